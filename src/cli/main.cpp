@@ -1,0 +1,3 @@
+#include "cli/command.h"
+
+int main(int count, char** arguments) { return fotomill::cli::RunCommandLine(count, arguments, {}); }

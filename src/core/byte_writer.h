@@ -1,0 +1,108 @@
+#pragma once
+
+#include <cstdint>
+#include <cstring>
+#include <span>
+#include <string>
+#include <string_view>
+
+#include "platform/memory.h"
+#include "platform/output_file.h"
+
+namespace fotomill {
+
+// Writes a new file front to back through one buffer. A failed write is remembered; ask Failed() or Commit() once at the
+// end. The file appears under its name only with a successful Commit, and leaves no trace without one.
+class ByteWriter {
+ public:
+  // False when the file cannot be created there (then status 10).
+  [[nodiscard]] bool Create(const std::string& path) {
+    return buffer_.Allocate(kBufferSize, platform::Fill::Unset) && file_.Create(path);
+  }
+
+  void U8(uint8_t value) { *Room(1) = value; }
+  void Le16(uint16_t value) { Little(value, 2); }
+  void Le32(uint32_t value) { Little(value, 4); }
+  void Be16(uint16_t value) { Big(value, 2); }
+  void Be32(uint32_t value) { Big(value, 4); }
+  void Text(std::string_view text) { Bytes({reinterpret_cast<const uint8_t*>(text.data()), text.size()}); }
+  void Zeros(uint64_t count) {
+    for (; count > 0; --count) U8(0);
+  }
+  void Bytes(std::span<const uint8_t> bytes) {
+    if (bytes.size() >= kBufferSize / 2) {
+      Flush();
+      failed_ = !file_.Write(bytes) || failed_;
+      flushed_ += bytes.size();
+    } else if (!bytes.empty()) {
+      std::memcpy(Room(bytes.size()), bytes.data(), bytes.size());
+    }
+  }
+  // Buffer space for up to `most` bytes (at most half of the buffer), to be filled by the caller, who then says with
+  // Used() how many of them there are.
+  uint8_t* Reserve(size_t most) {
+    if (kBufferSize - used_ < most) Flush();
+    return buffer_.Data() + used_;
+  }
+  void Used(size_t count) { used_ += count; }
+  static constexpr size_t kMostReserved = 128 * 1024;
+
+  // Bytes written so far.
+  uint64_t Position() const { return flushed_ + used_; }
+  // Overwrites bytes that lie before Position().
+  void PatchBe32(uint64_t offset, uint32_t value) {
+    const uint8_t bytes[] = {static_cast<uint8_t>(value >> 24), static_cast<uint8_t>(value >> 16),
+                             static_cast<uint8_t>(value >> 8), static_cast<uint8_t>(value)};
+    Patch(offset, bytes);
+  }
+  void PatchLe32(uint64_t offset, uint32_t value) {
+    const uint8_t bytes[] = {static_cast<uint8_t>(value), static_cast<uint8_t>(value >> 8),
+                             static_cast<uint8_t>(value >> 16), static_cast<uint8_t>(value >> 24)};
+    Patch(offset, bytes);
+  }
+  bool Failed() const { return failed_; }
+
+  // Writes what is left and gives the file its name.
+  [[nodiscard]] platform::CommitResult Commit(platform::Existing existing, bool sync = false) {
+    Flush();
+    if (failed_) {
+      file_.Discard();
+      return platform::CommitResult::Failed;
+    }
+    return file_.Commit(existing, sync);
+  }
+
+ private:
+  static constexpr size_t kBufferSize = 2 * kMostReserved;
+
+  uint8_t* Room(size_t count) {
+    uint8_t* room = Reserve(count);
+    used_ += count;
+    return room;
+  }
+  void Little(uint32_t value, unsigned count) {
+    uint8_t* room = Room(count);
+    for (unsigned i = 0; i < count; ++i) room[i] = static_cast<uint8_t>(value >> (8 * i));
+  }
+  void Big(uint32_t value, unsigned count) {
+    uint8_t* room = Room(count);
+    for (unsigned i = 0; i < count; ++i) room[i] = static_cast<uint8_t>(value >> (8 * (count - 1 - i)));
+  }
+  void Patch(uint64_t offset, std::span<const uint8_t> bytes) {
+    Flush();
+    failed_ = !file_.WriteAt(offset, bytes) || failed_;
+  }
+  void Flush() {
+    if (used_ > 0) failed_ = !file_.Write({buffer_.Data(), used_}) || failed_;
+    flushed_ += used_;
+    used_ = 0;
+  }
+
+  platform::OutputFile file_;
+  platform::MemoryBlock buffer_;
+  size_t used_ = 0;
+  uint64_t flushed_ = 0;
+  bool failed_ = false;
+};
+
+}  // namespace fotomill

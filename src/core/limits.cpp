@@ -1,0 +1,7 @@
+#include "core/limits.h"
+
+namespace fotomill {
+
+Limits limits;
+
+}  // namespace fotomill

@@ -1,0 +1,7 @@
+#include "core/settings.h"
+
+namespace fotomill {
+
+constinit Settings settings;
+
+}  // namespace fotomill

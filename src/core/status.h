@@ -1,0 +1,35 @@
+#pragma once
+
+#include <cstdint>
+#include <string_view>
+
+namespace fotomill {
+
+// Outcome of every codec, registry and batch operation. The number indexes the user message table.
+enum class [[nodiscard]] Status : int32_t {
+#define STATUS(number, name, message) name = number,
+#include "core/status.def"
+#undef STATUS
+};
+
+constexpr int32_t StatusNumber(Status status) { return static_cast<int32_t>(status); }
+
+// The user message of a status, "Ok" for success; numbers outside the table (a plug-in may return any) give an empty text.
+constexpr std::string_view StatusMessage(Status status) {
+  switch (status) {
+#define STATUS(number, name, message) \
+  case Status::name:                  \
+    return message;
+#include "core/status.def"
+#undef STATUS
+  }
+  return {};
+}
+
+// Passes any status but Ok on to the caller.
+#define RETURN_IF_BAD(expression)                                                        \
+  do {                                                                                   \
+    if (const ::fotomill::Status status_ = (expression); status_ != ::fotomill::Status::Ok) return status_; \
+  } while (false)
+
+}  // namespace fotomill

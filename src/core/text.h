@@ -1,0 +1,27 @@
+#pragma once
+
+#include <cstdint>
+#include <string>
+#include <string_view>
+
+namespace fotomill {
+
+// Case of ASCII letters only: extensions and keywords, whatever the user's language.
+constexpr char LowerCase(char c) { return c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c; }
+constexpr char UpperCase(char c) { return c >= 'a' && c <= 'z' ? static_cast<char>(c - 'a' + 'A') : c; }
+constexpr bool IsLetter(char c) { return LowerCase(c) >= 'a' && LowerCase(c) <= 'z'; }
+std::string LowerCase(std::string_view text);
+std::string UpperCase(std::string_view text);
+
+constexpr bool EqualIgnoringCase(std::string_view a, std::string_view b) {
+  if (a.size() != b.size()) return false;
+  for (size_t i = 0; i < a.size(); ++i) {
+    if (LowerCase(a[i]) != LowerCase(b[i])) return false;
+  }
+  return true;
+}
+
+// A number in decimal with a comma between every group of three digits.
+std::string WithThousands(uint64_t number);
+
+}  // namespace fotomill

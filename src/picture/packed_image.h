@@ -1,0 +1,93 @@
+#pragma once
+
+#include <cstdint>
+#include <span>
+
+#include "core/status.h"
+#include "picture/palette.h"
+#include "platform/memory.h"
+
+namespace fotomill {
+
+// The depth at which a picture of `bitsPerPixel` is held: 1, 4 (from 2), 8 (from 5) or 24 bits.
+constexpr int32_t NormalisedDepth(int32_t bitsPerPixel) {
+  if (bitsPerPixel == 1) return 1;
+  if (bitsPerPixel >= 2 && bitsPerPixel <= 4) return 4;
+  if (bitsPerPixel >= 5 && bitsPerPixel <= 8) return 8;
+  return 24;
+}
+
+// Bytes of one row of `width` pixels of `bits`, padded to a multiple of 4.
+constexpr uint64_t RowStride(int32_t width, int32_t bits) {
+  return (static_cast<uint64_t>(width) * static_cast<uint64_t>(bits) + 31) / 32 * 4;
+}
+
+// A device-independent bitmap in one block:
+//
+//   offset size            content, little-endian
+//        0    4            header size, 40
+//        4    4            width
+//        8    4            height, positive: rows are stored bottom row first
+//       12    2            planes, 1
+//       14    2            bits per pixel: 1, 4, 8 or 24
+//       16    4            compression, 0
+//       20    4            bytes of all rows
+//       24    8            two resolutions, 0
+//       32    8            colours used and important: 2, 16, 256, or 0 for 24 bits
+//       40    4 x colours  blue, green, red, 0
+//        .    rows         each padded to a multiple of 4 bytes; 24-bit pixels are blue, green, red
+//
+// Pixels of less than 8 bits lie in a byte from the most significant bit down. The holder owns the block.
+class PackedImage {
+ public:
+  static constexpr uint64_t kHeaderSize = 40;
+
+  bool Empty() const { return block_.Empty(); }
+  void Free() { *this = PackedImage(); }
+
+  int32_t Width() const { return width_; }
+  int32_t Height() const { return height_; }
+  int32_t Bits() const { return bits_; }
+  int32_t Colors() const { return bits_ == 24 ? 0 : 1 << bits_; }
+  uint64_t Stride() const { return stride_; }  // bytes
+
+  // Row y counted from the top, and row r in stored order, from the bottom. `stride` bytes each.
+  std::span<uint8_t> Row(int32_t y) { return StoredRow(height_ - 1 - y); }
+  std::span<const uint8_t> Row(int32_t y) const { return StoredRow(height_ - 1 - y); }
+  std::span<uint8_t> StoredRow(int32_t r) { return Rows().subspan(static_cast<uint64_t>(r) * stride_, stride_); }
+  std::span<const uint8_t> StoredRow(int32_t r) const {
+    return Rows().subspan(static_cast<uint64_t>(r) * stride_, stride_);
+  }
+  // All rows in stored order.
+  std::span<uint8_t> Rows() { return block_.Bytes().subspan(RowsOffset()); }
+  std::span<const uint8_t> Rows() const { return block_.Bytes().subspan(RowsOffset()); }
+  // The whole block, as laid out above.
+  std::span<const uint8_t> Bytes() const { return block_.Bytes(); }
+  // The colour table: Colors() entries of blue, green, red, 0.
+  std::span<uint8_t> ColorTable() { return block_.Bytes().subspan(kHeaderSize, RowsOffset() - kHeaderSize); }
+  std::span<const uint8_t> ColorTable() const { return block_.Bytes().subspan(kHeaderSize, RowsOffset() - kHeaderSize); }
+
+  // The value at column x, row y from the top: an index, or 0x00RRGGBB of a 24-bit picture; -1 outside the picture.
+  int32_t PixelAt(int32_t x, int32_t y) const;
+
+ private:
+  friend Status NewPackedImage(int32_t, int32_t, const Palette*, int32_t, PackedImage&, platform::Fill);
+  uint64_t RowsOffset() const { return kHeaderSize + 4 * static_cast<uint64_t>(Colors()); }
+
+  platform::MemoryBlock block_;
+  int32_t width_ = 0, height_ = 0, bits_ = 0;
+  uint64_t stride_ = 0;
+};
+
+// Makes the packed block of a picture at the normalised depth of `bitsPerPixel`, with its colour table taken from
+// `palette` (zero without one) and its rows zero; with Fill::Unset the rows hold anything, for callers that write every
+// byte of them, padding included. DamagedFile when width or height is below 1, MemoryAllocationError when the block would
+// exceed the limit or cannot be had; `image` is empty then.
+Status NewPackedImage(int32_t width, int32_t height, const Palette* palette, int32_t bitsPerPixel, PackedImage& image,
+                      platform::Fill fill = platform::Fill::Zero);
+
+// An 8-bit image of the same size as a picture, with the grey ramp as its palette: the form of an alpha plane, whose
+// values run from 0, transparent, to 255. Statuses as NewPackedImage.
+Status NewAlphaPlane(int32_t width, int32_t height, PackedImage& plane, platform::Fill fill = platform::Fill::Zero);
+
+}  // namespace fotomill

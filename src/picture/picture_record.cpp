@@ -1,0 +1,31 @@
+#include "picture/picture_record.h"
+
+#include <cstdarg>
+#include <cstdio>
+#include <new>
+#include <numeric>
+
+#include "core/settings.h"
+
+namespace fotomill {
+
+void DetailLines::AddFormat(const char* format, ...) {
+  char line[kMostCharacters + 1];
+  va_list arguments;
+  va_start(arguments, format);
+  std::vsnprintf(line, sizeof line, format, arguments);
+  va_end(arguments);
+  Add(line);
+}
+
+PicturePointer NewPictureRecord(void* window, void* context) {
+  PicturePointer picture(new (std::nothrow) PictureRecord);
+  if (picture == nullptr) return picture;
+  picture->window = window;
+  picture->context = context;
+  picture->defaultColour = static_cast<Color>(settings.AlphaBackground);
+  std::iota(picture->remap.begin(), picture->remap.end(), uint8_t{0});
+  return picture;
+}
+
+}  // namespace fotomill

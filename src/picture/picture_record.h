@@ -1,0 +1,117 @@
+#pragma once
+
+#include <array>
+#include <cstdint>
+#include <memory>
+#include <string_view>
+#include <vector>
+
+#include "core/fixed_text.h"
+#include "core/progress.h"
+#include "core/status.h"
+#include "picture/packed_image.h"
+#include "picture/palette.h"
+#include "platform/memory.h"
+
+namespace fotomill {
+
+// Colour values are 0x00BBGGRR.
+using Color = uint32_t;
+
+// Bits of PictureRecord::alphaFlags.
+inline constexpr uint8_t kHasAlpha = 1;             // the picture has alpha; set by `info` for sources deeper than 24 bits
+inline constexpr uint8_t kFlattenOnBackground = 2;  // flatten onto the record's own background
+
+// Technical facts of a file for "Get info": lines of at most 36 characters.
+class DetailLines {
+ public:
+  static constexpr size_t kMostCharacters = 36;
+  // Adds a line, cut to 36 characters.
+  void Add(std::string_view line) { lines_.emplace_back(line); }
+  // Adds a line made by a printf format, cut the same way.
+  [[gnu::format(printf, 2, 3)]] void AddFormat(const char* format, ...);
+  void Clear() { lines_.clear(); }
+  size_t Count() const { return lines_.size(); }
+  std::string_view Line(size_t index) const { return lines_[index].view(); }
+
+ private:
+  std::vector<FixedText<kMostCharacters>> lines_;
+};
+
+// What travels with a picture beside its pixels, each block as its standard lays it out; empty when there is none.
+struct PictureMetadata {
+  std::vector<uint8_t> exif;  // a TIFF structure from its byte order on, without any "Exif\0\0" in front
+  std::vector<uint8_t> xmp;   // an XMP packet
+  std::vector<uint8_t> icc;   // an ICC profile
+  double dpiX = 0, dpiY = 0;  // pixels per inch, 0 when the file does not say
+  bool Empty() const { return exif.empty() && xmp.empty() && icc.empty(); }
+};
+
+// The one in-memory form of a picture. `info` fills the facts, `read` the pixels; a writer or a viewer consumes both. The
+// record owns everything in it. On any failure of `read`, `image` and `alpha` stay empty.
+struct PictureRecord {
+  PathText fileName;          // the file being read or written
+  PathText workName;          // while writing: the name that `fileName` held before
+  FixedText<64> typeName;     // the variant that `info` found, such as "OS/2 bitmap"
+  int32_t width = 0;          // pixels
+  int32_t height = 0;         // rows
+  int32_t bitsPerPixel = 0;   // 1 to 8, or 24
+  platform::MemoryBlock metafile;     // the picture of a rendered format
+  platform::MemoryBlock extraBlock;
+  uint8_t metafileKind = 0;   // 128 or more: `metafile` is an enhanced one
+  Color defaultColour = 0xffffff;     // what alpha is flattened onto unless the record has its own background
+  uint64_t fileSize = 0;      // bytes, measured by `info`
+  uint64_t imageBytes = 0;    // estimate of the pixel data
+  Palette palette{};
+  void* window = nullptr;     // the face's window for which the record was made; not owned
+  PackedImage image;          // empty until `read` succeeds
+  int32_t formatIndex = -1;   // row of the registry, -1 none
+  void* context = nullptr;    // the job that asked for the picture; not owned
+  std::array<uint8_t, 256> remap{};   // colour translation, the identity at first
+  DetailLines detailLines;
+  platform::MemoryBlock auxBlock;
+  platform::MemoryBlock extraBlock2;
+  PackedImage alpha;          // empty when the picture has none
+  Color background = 0;       // the record's own background
+  uint8_t alphaFlags = 0;     // kHasAlpha, kFlattenOnBackground
+
+  PictureMetadata metadata;
+  std::vector<uint8_t> comment;       // the file's comment text, UTF-8
+  int32_t pageCount = 1;      // pages or frames in the file
+  int32_t page = 0;           // the page that `read` is to decode, from 0
+  int32_t thumbnailSide = 0;  // above 0: a decoder may deliver any smaller size whose shorter use still gives at least
+                              // twice this square; `width` and `height` keep the full size, `image` tells its own
+  ProgressSink* progress = nullptr;   // not owned, may be null
+
+  void ReportRow(int32_t done) const {
+    if (progress != nullptr) progress->Step(done, height);
+  }
+};
+
+using PicturePointer = std::unique_ptr<PictureRecord>;
+
+// A new record with its defaults set: format -1, identity `remap`, `defaultColour` from the settings. Null without memory.
+PicturePointer NewPictureRecord(void* window = nullptr, void* context = nullptr);
+
+// The usual estimate of a picture's pixel data: ((width + 7) / 8) x bits x height.
+constexpr uint64_t EstimateImageBytes(int32_t width, int32_t height, int32_t bitsPerPixel) {
+  return (static_cast<uint64_t>(width) + 7) / 8 * static_cast<uint64_t>(bitsPerPixel) * static_cast<uint64_t>(height);
+}
+
+// Begins and ends the progress of one operation on a picture.
+class ProgressScope {
+ public:
+  explicit ProgressScope(const PictureRecord& picture) : sink_(picture.progress) {
+    if (sink_ != nullptr) sink_->Begin();
+  }
+  ~ProgressScope() {
+    if (sink_ != nullptr) sink_->End();
+  }
+  ProgressScope(const ProgressScope&) = delete;
+  ProgressScope& operator=(const ProgressScope&) = delete;
+
+ private:
+  ProgressSink* sink_;
+};
+
+}  // namespace fotomill

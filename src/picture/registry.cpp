@@ -1,0 +1,305 @@
+#include "picture/registry.h"
+
+#include <array>
+#include <iterator>
+
+#include "core/settings.h"
+#include "core/text.h"
+#include "formats/bmp.h"
+#include "formats/pcx.h"
+#include "platform/paths.h"
+
+namespace fotomill {
+
+namespace {
+
+// Rows whose codec this build does not have.
+Status NoDetails(PictureRecord&) { return Status::UnsupportedFunction; }
+Status NoInfo(PictureRecord&, const char*, uint32_t) { return Status::UnsupportedFunction; }
+Status NoRead(PictureRecord&, const char*) { return Status::UnsupportedFunction; }
+Status NoWrite(PictureRecord&, const WriteOptions&) { return Status::UnsupportedFunction; }
+
+struct BuiltInRow {
+  std::string_view extension;
+  std::string_view description;
+  int32_t enabled;
+  uint32_t maxBits;
+  uint32_t flags;
+  DetailsOperation details;
+  InfoOperation info;
+  ReadOperation read;
+  WriteOperation write;
+};
+
+// The order is behaviour: the first row that matches a name wins, so .jpeg is read as JPE and .tiff as TIF.
+// clang-format off
+constexpr BuiltInRow kBuiltInRows[] = {
+    {"AVI", "(AVI) Video for Windows", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"BGA", "(BGA) OS/2 Warp", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_ALPHA,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"BMP", "(BMP) Windows bitmap", 1, 24, FMT_BITMAP | FMT_ALPHA,
+     BmpDetails, BmpInfo, BmpRead, BmpWrite},
+    {"CDR", "(CDR) Corel Draw Preview", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES,
+     NoDetails, NoInfo, NoRead, NoWrite},
+    {"CUT", "(CUT) Dr. Halo", 1, 8, FMT_BITMAP,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"DCX", "(DCX) DCX FAX", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"DIB", "(DIB) Windows", 1, 24, FMT_BITMAP | FMT_ALPHA,
+     nullptr, BmpInfo, BmpRead, BmpWrite},
+    {"EXE", "(EXE) Self-displaying image", 0, 24, FMT_BITMAP,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"FIT", "(FIT) Flexible Image Transport", 1, 24, FMT_BITMAP,
+     NoDetails, NoInfo, NoRead, NoWrite},
+    {"GIF", "(GIF) CompuServe", 1, 8, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_PAGES | FMT_TIMED | FMT_FRAMES | FMT_LAYERED | FMT_TRANSPARENT,
+     NoDetails, NoInfo, NoRead, NoWrite},
+    {"HDP", "(HDP) HD Photo", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_FRAMES | FMT_LAYERED,
+     NoDetails, NoInfo, NoRead, NoWrite},
+    {"HRZ", "(HRZ) SSTV", 1, 24, FMT_BITMAP,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"ICO", "(ICO) Windows icon", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_CONTAINER | FMT_LAYERED | FMT_TRANSPARENT | FMT_ALPHA,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"IFF", "(IFF) Amiga", 1, 24, FMT_BITMAP,
+     NoDetails, NoInfo, NoRead, NoWrite},
+    {"IMG", "(IMG) GEM/Ventura", 1, 24, FMT_BITMAP,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"JPG", "(JPG) Jpeg", 1, 24, FMT_BITMAP,
+     NoDetails, NoInfo, NoRead, NoWrite},
+    {"LBM", "(LBM) Amiga", 1, 8, FMT_BITMAP,
+     NoDetails, NoInfo, NoRead, NoWrite},
+    {"MAC", "(MAC) MacPaint", 1, 1, FMT_BITMAP,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"MOV", "(MOV) QuickTime movies", 1, 24, FMT_BITMAP | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES,
+     NoDetails, NoInfo, NoRead, NoWrite},
+    {"MSP", "(MSP) Microsoft Paint", 1, 1, FMT_BITMAP,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"PCD", "(PCD) Kodak Photo-CD", 1, 24, FMT_BITMAP | FMT_MEDIA,
+     NoDetails, NoInfo, NoRead, NoWrite},
+    {"PCX", "(PCX) PC Paintbrush", 1, 24, FMT_BITMAP,
+     nullptr, PcxInfo, PcxRead, PcxWrite},
+    {"PDD", "(PDD) Adobe Photoshop 2.5", 1, 24, FMT_BITMAP,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"PIC", "(PIC) GLPaint/Pegasus", 1, 24, FMT_BITMAP,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"PNG", "(PNG) Portable Network Graphics", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_PAGES | FMT_FRAMES | FMT_PNG | FMT_LAYERED | FMT_TRANSPARENT | FMT_SAVE_ANYWAY | FMT_ALPHA,
+     NoDetails, NoInfo, NoRead, NoWrite},
+    {"PSD", "(PSD) Adobe Photoshop 2.5", 1, 24, FMT_BITMAP,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"RAS", "(RAS) Sun Raster", 1, 24, FMT_BITMAP,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"RLE", "(RLE) Windows", 1, 8, FMT_BITMAP,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"SCR", "(SCR) Windows Screen Saver", 1, 24, FMT_BITMAP,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"SGI", "(SGI) Silicon Graphics", 1, 24, FMT_BITMAP | FMT_ALPHA,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"SWF", "(SWF) Flash", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_TIMED | FMT_FRAMES | FMT_LAYERED | FMT_TRANSPARENT | FMT_FLASH,
+     NoDetails, NoInfo, NoRead, NoWrite},
+    {"TGA", "(TGA) Targa", 1, 24, FMT_BITMAP | FMT_ALPHA,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"TIF", "(TIF) TIFF", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_LAYERED | FMT_ALPHA,
+     NoDetails, NoInfo, NoRead, NoWrite},
+    {"TXT", "(TXT) Text files", 1, 24, FMT_BITMAP,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"WAV", "(WAV) Windows WAV", 1, 24, FMT_BITMAP | FMT_SOUND | FMT_MEDIA,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"WBMP", "(WBMP) WAP bitmap", 1, 1, FMT_BITMAP,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"WEBP", "(WEBP) Google WebP", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES | FMT_LAYERED | FMT_TRANSPARENT | FMT_ALPHA,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"WPG", "(WPG) WordPerfect Graphics", 1, 8, FMT_BITMAP,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"XBM", "(XBM) XWindows bitmap", 1, 1, FMT_BITMAP,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"Clpbrd", "Windows Clipboard", 1, 24, FMT_BITMAP | FMT_RENDERED | FMT_CLIPBOARD,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"Wllppr", "(BMP) Windows wallpaper", 1, 24, FMT_BITMAP | FMT_WALLPAPER | FMT_NO_OPEN,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"ANI", "(ANI) Windows animated cursor", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES | FMT_LAYERED | FMT_SECONDARY | FMT_TRANSPARENT,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"CAL", "(CAL) CALS", 1, 1, FMT_BITMAP | FMT_SECONDARY,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"CALS", "(CAL) CALS", 1, 1, FMT_BITMAP | FMT_SECONDARY,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"CAM", "(CAM) Casio Digital Camera", 1, 24, FMT_BITMAP | FMT_SECONDARY,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"EMF", "(EMF) Enhanced Metafile", 1, 24, FMT_RENDERED | FMT_SECONDARY,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"EPS", "(EPS) EPS Preview", 0, 24, FMT_SECONDARY,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"FIF", "(FIF) Fractal Image", 1, 24, FMT_BITMAP | FMT_SECONDARY,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"FLI", "(FLI) FLIC animation", 1, 8, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES | FMT_SECONDARY,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"FLC", "(FLC) FLIC animation", 1, 8, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES | FMT_SECONDARY,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"FPX", "(FPX) FlashPix", 1, 24, FMT_BITMAP | FMT_SECONDARY,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"FTS", "(FTS) Flex. Image Transport", 1, 24, FMT_BITMAP | FMT_SECONDARY,
+     NoDetails, NoInfo, NoRead, NoWrite},
+    {"CUR", "(CUR) Windows cursor", 1, 24, FMT_BITMAP | FMT_SECONDARY | FMT_ALPHA,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"HAM", "(HAM) Amiga", 1, 24, FMT_BITMAP | FMT_SECONDARY,
+     NoDetails, NoInfo, NoRead, NoWrite},
+    {"JFI", "(JFI) Jpeg", 0, 24, FMT_BITMAP | FMT_SECONDARY,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"JFIF", "(JFIF) Jpeg", 1, 24, FMT_BITMAP | FMT_SECONDARY,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"JPE", "(JPE) Jpeg", 0, 24, FMT_BITMAP | FMT_SECONDARY,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"JPEG", "(JPEG) Jpeg", 1, 24, FMT_BITMAP | FMT_SECONDARY,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"KDC", "(KDC) Kodak Digital Camera", 1, 24, FMT_BITMAP | FMT_SECONDARY,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"PCT", "(PCT) Macintosh PICT", 1, 24, FMT_BITMAP | FMT_SECONDARY,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"KQP", "(KQP) Konica Quality Photos", 1, 24, FMT_BITMAP | FMT_SECONDARY,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"PSP", "(PSP) PSP", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_SECONDARY,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"MID", "(MID) MIDI music", 1, 24, FMT_BITMAP | FMT_SECONDARY | FMT_MEDIA | FMT_MIDI,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"MP3", "(MP3) MP3 compressed music", 1, 24, FMT_BITMAP | FMT_TIMED | FMT_SECONDARY | FMT_MEDIA,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"MP4", "(MP4) MPEG-4 video", 1, 24, FMT_BITMAP | FMT_ANIMATED | FMT_TIMED | FMT_SECONDARY | FMT_MEDIA,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"MPEG", "(MPEG) MPEG-4 video", 1, 24, FMT_BITMAP | FMT_ANIMATED | FMT_TIMED | FMT_SECONDARY | FMT_MEDIA,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"MPG", "(MPG) MPEG-4 video", 1, 24, FMT_BITMAP | FMT_ANIMATED | FMT_TIMED | FMT_SECONDARY | FMT_MEDIA,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"M4V", "(M4V) MPEG-4 video", 1, 24, FMT_BITMAP | FMT_ANIMATED | FMT_TIMED | FMT_SECONDARY | FMT_MEDIA,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"RGB", "(RGB) Silicon Graphics", 1, 24, FMT_BITMAP | FMT_SECONDARY | FMT_ALPHA,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"TTF", "(TTF) TrueType Font", 1, 24, FMT_BITMAP | FMT_SECONDARY,
+     NoDetails, NoInfo, NoRead, NoWrite},
+    {"OTF", "(OTF) OpenType Font", 1, 24, FMT_BITMAP | FMT_SECONDARY,
+     NoDetails, NoInfo, NoRead, NoWrite},
+    {"UUE", "(UUE) UUEncoded graphics", 1, 24, FMT_BITMAP | FMT_SECONDARY,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"WDP", "(WDP) HD Photo", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_FRAMES | FMT_LAYERED | FMT_SECONDARY,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"WMF", "(WMF) Windows Metafile", 1, 24, FMT_RENDERED | FMT_SECONDARY,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"WMV", "(WMV) WMV video", 1, 24, FMT_BITMAP | FMT_ANIMATED | FMT_TIMED | FMT_SECONDARY | FMT_MEDIA,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"RAR", "(RAR) RAR archive", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_CONTAINER | FMT_LAYERED | FMT_SECONDARY | FMT_ARCHIVE,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"ZIP", "(ZIP) ZIP archive", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_CONTAINER | FMT_LAYERED | FMT_SECONDARY | FMT_ARCHIVE,
+     nullptr, NoInfo, NoRead, NoWrite},
+    {"", "", 0, 0, FMT_SPARE,
+     nullptr, nullptr, nullptr, nullptr},
+};
+// clang-format on
+static_assert(std::size(kBuiltInRows) == formatCount);
+static_assert(kBuiltInRows[kSpareRow].flags == FMT_SPARE && kBuiltInRows[kSpareRow].info == nullptr);
+
+constexpr std::array<FormatEntry, formatCount> MakeRows() {
+  std::array<FormatEntry, formatCount> rows;
+  for (size_t i = 0; i < rows.size(); ++i) {
+    const BuiltInRow& facts = kBuiltInRows[i];
+    rows[i] = {.details = facts.details,
+               .info = facts.info,
+               .read = facts.read,
+               .write = facts.write,
+               .maxBits = facts.maxBits,
+               .extension = facts.extension,
+               .description = facts.description,
+               .enabled = facts.enabled,
+               .flags = facts.flags};
+  }
+  return rows;
+}
+
+constinit std::array<FormatEntry, formatCount> formatRows = MakeRows();
+PluginFallback pluginFallback = nullptr;
+
+// A row matches an extension that equals its own, or that shares its first three characters; a shorter one must match
+// to its end.
+bool RowMatches(std::string_view rowExtension, std::string_view extension) {
+  return EqualIgnoringCase(extension, rowExtension) ||
+         EqualIgnoringCase(extension.substr(0, 3), rowExtension.substr(0, 3));
+}
+
+}  // namespace
+
+FormatEntry& FormatRow(int32_t index) { return formatRows[static_cast<size_t>(index)]; }
+
+int32_t FindFormatByName(std::string_view fileName, int32_t parameter) {
+  const std::string_view extension = platform::ExtensionOf(fileName);
+  for (int32_t i = 0; i < formatCount && !extension.empty(); ++i) {
+    const FormatEntry& row = FormatRow(i);
+    if ((row.flags & (FMT_SPARE | FMT_CLIPBOARD)) != 0) continue;
+    if (settings.AllowPluginFormatOverride != 0 && row.enabled == 0) continue;
+    if (RowMatches(row.extension, extension)) return i;
+  }
+  return FindPluginFormat(fileName, parameter);
+}
+
+void InstallPluginFallback(PluginFallback fallback) { pluginFallback = fallback; }
+
+int32_t FindPluginFormat(std::string_view fileName, int32_t parameter) {
+  return pluginFallback == nullptr ? kNoFormat : pluginFallback(fileName, parameter);
+}
+
+bool CanRead(const FormatEntry& row) { return row.read != nullptr && row.read != NoRead; }
+
+bool CanWrite(const FormatEntry& row) { return row.write != nullptr && row.write != NoWrite; }
+
+void RunFormatStartup() {
+  for (const FormatEntry& row : formatRows) {
+    if (row.startup != nullptr) (void)row.startup();
+  }
+}
+
+void RunFormatShutdown() {
+  for (const FormatEntry& row : formatRows) {
+    if (row.shutdown != nullptr) (void)row.shutdown();
+  }
+}
+
+std::string DescribeFileType(std::string_view fileName) {
+  const std::string extension = UpperCase(platform::ExtensionOf(fileName));
+  for (const FormatEntry& row : formatRows) {
+    if (row.enabled == 0 || (row.flags & (FMT_WALLPAPER | FMT_CLIPBOARD | FMT_SPARE)) != 0) continue;
+    if (EqualIgnoringCase(row.extension, extension)) return std::string(row.description.view());
+  }
+  return "(" + extension + ") " + extension + " file";
+}
+
+std::vector<FilterPair> OpenFileFilter() {
+  std::vector<FilterPair> pairs(1, {"All pictures", ""});
+  for (const FormatEntry& row : formatRows) {
+    if ((row.flags & (FMT_WALLPAPER | FMT_CLIPBOARD | FMT_NO_OPEN | FMT_SPARE)) != 0) continue;
+    const std::string pattern = "*." + std::string(row.extension.view());
+    pairs.push_back({std::string(row.description.view()), pattern});
+    pairs[0].patterns += (pairs[0].patterns.empty() ? "" : ";") + pattern;
+  }
+  return pairs;
+}
+
+std::vector<int32_t> DestinationRows() {
+  constexpr uint32_t kExcluded = FMT_WALLPAPER | FMT_CLIPBOARD | FMT_SECONDARY | FMT_ANIMATED | FMT_SPARE;
+  std::vector<int32_t> rows;
+  for (int32_t i = 0; i < formatCount; ++i) {
+    const uint32_t flags = FormatRow(i).flags;
+    if ((flags & FMT_SAVE_ANYWAY) != 0 || (flags & kExcluded) == 0) rows.push_back(i);
+  }
+  return rows;
+}
+
+std::vector<int32_t> FormatListRows() {
+  std::vector<int32_t> rows;
+  for (int32_t i = 0; i < formatCount; ++i) {
+    if ((FormatRow(i).flags & (FMT_CLIPBOARD | FMT_SPARE)) == 0) rows.push_back(i);
+  }
+  return rows;
+}
+
+std::string FormatListLine(int32_t index) {
+  const FormatEntry& row = FormatRow(index);
+  return (row.enabled != 0 ? "\xc3\x97\t" : " \t") + std::string(row.description.view());
+}
+
+}  // namespace fotomill

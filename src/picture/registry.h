@@ -1,0 +1,124 @@
+#pragma once
+
+#include <cstdint>
+#include <span>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "core/status.h"
+#include "picture/picture_record.h"
+#include "picture/write_options.h"
+
+namespace fotomill {
+
+// Capability bits of a format row.
+inline constexpr uint32_t FMT_BITMAP = 0x1;
+inline constexpr uint32_t FMT_RENDERED = 0x2;        // complete after `info`; `read` is never called
+inline constexpr uint32_t FMT_MULTI = 0x4;           // can hold more than one picture
+inline constexpr uint32_t FMT_ANIMATED = 0x8;
+inline constexpr uint32_t FMT_CLIPBOARD = 0x20;      // in no list and never matched by extension
+inline constexpr uint32_t FMT_HIDDEN = 0x40;
+inline constexpr uint32_t FMT_PAGES = 0x100;
+inline constexpr uint32_t FMT_TIMED = 0x200;
+inline constexpr uint32_t FMT_FRAMES = 0x400;
+inline constexpr uint32_t FMT_WALLPAPER = 0x800;
+inline constexpr uint32_t FMT_CONTAINER = 0x1000;
+inline constexpr uint32_t FMT_PNG = 0x2000;
+inline constexpr uint32_t FMT_SOUND = 0x4000;
+inline constexpr uint32_t FMT_LAYERED = 0x8000;
+inline constexpr uint32_t FMT_SECONDARY = 0x10000;   // left out of the destination list
+inline constexpr uint32_t FMT_NO_OPEN = 0x20000;     // left out of the open-file filter
+inline constexpr uint32_t FMT_TRANSPARENT = 0x40000;
+inline constexpr uint32_t FMT_MEDIA = 0x80000;
+inline constexpr uint32_t FMT_MIDI = 0x100000;
+inline constexpr uint32_t FMT_SPARE = 0x200000;      // free slot for a plug-in format
+inline constexpr uint32_t FMT_FLASH = 0x400000;
+inline constexpr uint32_t FMT_ARCHIVE = 0x800000;
+inline constexpr uint32_t FMT_SAVE_ANYWAY = 0x1000000;  // in the destination list whatever else is set
+inline constexpr uint32_t FMT_ALPHA = 0x2000000;     // stores an alpha channel
+
+// Operations of a row. Codecs implement them as plain functions; none of them knows the registry.
+using DetailsOperation = Status (*)(PictureRecord& picture);  // fills `detailLines` of a record that `info` has filled
+using InfoOperation = Status (*)(PictureRecord& picture, const char* fileName, uint32_t flags);
+using ReadOperation = Status (*)(PictureRecord& picture, const char* fileName);
+using WriteOperation = Status (*)(PictureRecord& picture, const WriteOptions& options);  // to picture.fileName
+using LifeOperation = int32_t (*)();
+using OptionsOperation = int32_t (*)(void* parentWindow, int32_t parameter);
+
+// One row of the registry.
+struct FormatEntry {
+  DetailsOperation details = nullptr;
+  InfoOperation info = nullptr;
+  ReadOperation read = nullptr;
+  WriteOperation write = nullptr;
+  LifeOperation startup = nullptr;
+  LifeOperation shutdown = nullptr;
+  uint32_t reserved = 0;
+  uint32_t maxBits = 0;          // deepest picture that `write` takes, bits per pixel
+  PathText extension;            // upper case, without the dot
+  PathText description;          // as shown to the user
+  int32_t enabled = 0;           // the user's switch, 1 or 0
+  uint32_t flags = 0;            // FMT_ bits
+  OptionsOperation options = nullptr;  // the row's override dialog, set by the desktop
+};
+
+inline constexpr int32_t kNoFormat = -1;
+inline constexpr int32_t kSpareRow = 77;
+inline constexpr int32_t formatCount = 78;
+
+// Row `index` of the registry; the rows live as long as the program. Only `enabled`, `options` and the spare row change.
+FormatEntry& FormatRow(int32_t index);
+
+// The row that a file name selects by its extension, or kNoFormat. The first row wins whose extension equals the
+// name's, or whose first three characters equal the first three of the name's, ignoring case; spare rows are skipped, as
+// are disabled ones with `AllowPluginFormatOverride`. Where no row matches, the plug-ins are asked.
+int32_t FindFormatByName(std::string_view fileName, int32_t parameter = 0);
+
+// The plug-in fallback of FindFormatByName: binds the plug-in format of that extension to the spare row and returns its
+// index, or kNoFormat. Installed by the plug-in loader; without it nothing matches.
+using PluginFallback = int32_t (*)(std::string_view fileName, int32_t parameter);
+void InstallPluginFallback(PluginFallback fallback);
+int32_t FindPluginFormat(std::string_view fileName, int32_t parameter = 0);
+
+// Whether a row's operation does its work in this build, and if not, why ("" when it does).
+bool CanRead(const FormatEntry& row);
+bool CanWrite(const FormatEntry& row);
+
+// Call `startup`, or `shutdown`, of every row that has one, in row order.
+void RunFormatStartup();
+void RunFormatShutdown();
+
+// Opens and decodes a file into a new record: finds its row, runs `info` and, for rows that are not rendered, `read`.
+// UnsupportedFormat (8) when no row matches, else the codec's own status; `picture` is null unless Ok.
+Status LoadPicture(const char* fileName, PicturePointer& picture, void* window = nullptr);
+// The first half of it: a record with the facts of a file. `flags` are handed to `info`.
+Status LoadPictureInfo(const char* fileName, PicturePointer& picture, uint32_t flags = 0);
+
+// Writes a picture to `destination` in the format of its extension. UnsupportedFormat (8) when no row matches,
+// TooManyColors (12) when the picture is deeper than the row takes, UnsupportedFunction (5) when the row cannot write,
+// InvalidDestination (29) for a path over 260 characters, else the codec's own status. Alpha that the format cannot hold
+// is flattened first. The picture stays the caller's.
+Status WritePicture(PictureRecord& picture, std::string_view destination, const WriteOptions& options);
+// The same to a given row.
+Status WritePictureAs(PictureRecord& picture, std::string_view destination, int32_t formatIndex,
+                      const WriteOptions& options);
+
+// The type name of a file for a browser's column, such as "(BMP) Windows bitmap", or "(XYZ) XYZ file".
+std::string DescribeFileType(std::string_view fileName);
+
+// Description and patterns ("*.BMP;*.DIB") of one line of the open-file filter.
+struct FilterPair {
+  std::string description;
+  std::string patterns;
+};
+// All pictures first, then one pair per row that can be opened, in row order.
+std::vector<FilterPair> OpenFileFilter();
+// Rows in which pictures can be saved, as offered to the user, in row order: indices.
+std::vector<int32_t> DestinationRows();
+// The rows of the format list, in which the user switches formats on and off: indices.
+std::vector<int32_t> FormatListRows();
+// A line of that list: a multiplication sign (U+00D7) or a blank, a tab, the description.
+std::string FormatListLine(int32_t index);
+
+}  // namespace fotomill

@@ -1,0 +1,32 @@
+#pragma once
+
+#include <string>
+
+#include "core/byte_writer.h"
+#include "core/status.h"
+#include "platform/output_file.h"
+
+namespace fotomill {
+
+// What the caller of a `write` operation decides beside the settings.
+struct WriteOptions {
+  platform::Existing existing = platform::Existing::Replace;  // what to do about a file of the destination's name
+  bool keepMetadata = true;  // EXIF, XMP and ICC of the record go into formats that can hold them
+  std::string password;      // for formats that can be protected; empty: none
+};
+
+// Commits a writer's file as the options say: Ok; ErrorWritingFile when a write failed; ErrorCreatingFile when the name
+// was taken meanwhile and must not be replaced.
+inline Status CommitOutput(ByteWriter& out, const WriteOptions& options) {
+  switch (out.Commit(options.existing)) {
+    case platform::CommitResult::Done:
+      return Status::Ok;
+    case platform::CommitResult::Taken:
+      return Status::ErrorCreatingFile;
+    case platform::CommitResult::Failed:
+      break;
+  }
+  return Status::ErrorWritingFile;
+}
+
+}  // namespace fotomill

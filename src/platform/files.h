@@ -1,0 +1,67 @@
+#pragma once
+
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "platform/output_file.h"
+
+namespace fotomill::platform {
+
+enum class FileKind { Missing, Regular, Folder, Other };  // Other: FIFO, device, socket, dangling link
+
+// What the system tells of a file. Times are seconds since 1970-01-01 UTC.
+struct FileFacts {
+  FileKind kind = FileKind::Missing;
+  uint64_t size = 0;
+  int64_t modified = 0;
+  int64_t created = 0;   // the birth time where the file system keeps one, else the modification time
+  bool link = false;     // the name itself is a symbolic link
+  uint64_t device = 0, identity = 0;  // together they name the file itself, whatever its path
+};
+
+// Facts of the file that `path` leads to, through links. Missing is a kind, not an error.
+FileFacts FactsOf(const std::string& path);
+bool FileExists(const std::string& path);       // anything of that name, a dangling link included
+bool IsRegularFile(const std::string& path);
+bool IsFolder(const std::string& path);
+
+// Names in a folder, without "." and "..", in byte order. nullopt when it cannot be read.
+struct FolderEntry {
+  std::string name;
+  FileKind kind;   // of the entry itself: a link is Other unless `link` says what it leads to
+  bool link;
+};
+std::optional<std::vector<FolderEntry>> ListFolder(const std::string& path);
+// Makes a folder with its parents; true when it is there afterwards.
+[[nodiscard]] bool MakeFolders(const std::string& path);
+
+// Deletes one file, never a folder. A path's final link is deleted itself.
+[[nodiscard]] bool DeleteFile(const std::string& path);
+// Renames within one file system.
+[[nodiscard]] CommitResult RenameFile(const std::string& from, const std::string& to, Existing existing);
+// Moves a file or folder into the system's trash, from which its user can bring it back. False when there is none for
+// it; nothing has happened then.
+[[nodiscard]] bool MoveToTrash(const std::string& path);
+// Whether MoveToTrash can work for that path, without doing it.
+bool HasTrash(const std::string& path);
+
+// The attribute that keeps a file out of listings. Systems whose hidden files are a matter of their names answer true and
+// change nothing.
+[[nodiscard]] bool SetHidden(const std::string& path, bool hidden);
+bool IsHidden(const std::string& path);
+// Clears hidden and read-only.
+[[nodiscard]] bool SetNormal(const std::string& path);
+// Gives a file the modification time of another.
+[[nodiscard]] bool CopyTimes(const std::string& from, const std::string& to);
+
+// A small whole file, at most `most` bytes. Missing and unreadable are told apart: who would overwrite a file that it
+// could not read loses it.
+enum class ReadResult { Done, Missing, Failed, TooLarge };
+ReadResult ReadWholeFile(const std::string& path, uint64_t most, std::string& contents);
+// Replaces a file's contents in one step, synced. False leaves the old file as it was.
+[[nodiscard]] bool WriteWholeFile(const std::string& path, std::string_view contents);
+
+}  // namespace fotomill::platform

@@ -1,0 +1,25 @@
+#pragma once
+
+#include <string>
+
+namespace fotomill::platform {
+
+// The user's folders; each is a path without a closing separator, or empty when the system has none.
+enum class SpecialFolder {
+  ApplicationData,  // $XDG_CONFIG_HOME, else ~/.config; on Windows the roaming application data (CSIDL 26)
+  Cache,            // $XDG_CACHE_HOME, else ~/.cache
+  Home,
+  Pictures,
+  Documents,
+  Temporary,
+};
+std::string SpecialFolderPath(SpecialFolder folder);
+
+// The running program's own file and its folder, links resolved.
+std::string ProgramPath();
+std::string ProgramFolder();
+std::string CurrentFolder();
+// A relative path made absolute against the current folder, with "." and ".." taken out; links stay.
+std::string AbsolutePath(const std::string& path);
+
+}  // namespace fotomill::platform

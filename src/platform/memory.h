@@ -1,0 +1,48 @@
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <span>
+#include <utility>
+
+namespace fotomill::platform {
+
+// How a new block's bytes start. `Unset` is for owners that write every byte before anyone reads one.
+enum class Fill { Zero, Unset };
+
+// A movable block of memory that its holder owns. Large blocks come from a process-wide pool, so that a batch pays for
+// fresh pages once, and ask for huge pages.
+class MemoryBlock {
+ public:
+  MemoryBlock() = default;
+  MemoryBlock(MemoryBlock&& other) noexcept
+      : data_(std::exchange(other.data_, nullptr)), size_(std::exchange(other.size_, 0)),
+        capacity_(std::exchange(other.capacity_, 0)) {}
+  MemoryBlock& operator=(MemoryBlock&& other) noexcept;
+  MemoryBlock(const MemoryBlock&) = delete;
+  MemoryBlock& operator=(const MemoryBlock&) = delete;
+  ~MemoryBlock() { Free(); }
+
+  // Replaces the block by one of `size` bytes. False, with the block empty, when there is no memory.
+  [[nodiscard]] bool Allocate(uint64_t size, Fill fill = Fill::Zero);
+  // Grows or shrinks, keeping the contents up to the smaller size; new bytes are zero. False leaves the block as it was.
+  [[nodiscard]] bool Resize(uint64_t size);
+  void Free();
+
+  bool Empty() const { return data_ == nullptr; }
+  uint64_t Size() const { return size_; }
+  uint8_t* Data() { return data_; }
+  const uint8_t* Data() const { return data_; }
+  std::span<uint8_t> Bytes() { return {data_, static_cast<size_t>(size_)}; }
+  std::span<const uint8_t> Bytes() const { return {data_, static_cast<size_t>(size_)}; }
+
+ private:
+  uint8_t* data_ = nullptr;
+  uint64_t size_ = 0;
+  uint64_t capacity_ = 0;  // bytes really reserved: size_ rounded up to what the pool deals in
+};
+
+// Gives the pool's unused blocks back to the system.
+void TrimMemoryPool();
+
+}  // namespace fotomill::platform

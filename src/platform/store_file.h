@@ -1,0 +1,56 @@
+#pragma once
+
+#include <cstdint>
+#include <span>
+#include <string>
+
+namespace fotomill::platform {
+
+// A file that is read and written in place, with an exclusive lock that dies with the process: what stores are made of.
+class StoreFile {
+ public:
+  StoreFile() = default;
+  StoreFile(StoreFile&& other) noexcept;
+  StoreFile& operator=(StoreFile&& other) noexcept;
+  ~StoreFile() { Close(); }
+
+  enum class Mode { Read, ReadWrite, CreateNew };  // CreateNew fails when the name is taken
+  enum class OpenResult { Done, Missing, Exists, Failed };
+  // Opens a regular file; links are followed for reading only.
+  OpenResult Open(const std::string& path, Mode mode);
+  void Close();
+  bool IsOpen() const { return handle_ != -1; }
+
+  uint64_t Size() const;
+  int64_t Modified() const;  // nanoseconds since 1970, as precise as the system keeps it
+  // All or nothing: false when fewer bytes were read or written.
+  [[nodiscard]] bool ReadAt(uint64_t offset, std::span<uint8_t> bytes) const;
+  [[nodiscard]] bool WriteAt(uint64_t offset, std::span<const uint8_t> bytes);
+  [[nodiscard]] bool Sync();
+  // Waits for the exclusive lock on the file. Advisory between programs that ask for it.
+  [[nodiscard]] bool Lock();
+  void Unlock();
+  // Whether `path` still names this very file; after waiting for a lock another process may have replaced it.
+  bool IsStill(const std::string& path) const;
+
+ private:
+  int64_t handle_ = -1;
+};
+
+// Holds a lock for a scope.
+class StoreLock {
+ public:
+  explicit StoreLock(StoreFile& file) : file_(file), held_(file.Lock()) {}
+  ~StoreLock() {
+    if (held_) file_.Unlock();
+  }
+  StoreLock(const StoreLock&) = delete;
+  StoreLock& operator=(const StoreLock&) = delete;
+  bool Held() const { return held_; }
+
+ private:
+  StoreFile& file_;
+  bool held_;
+};
+
+}  // namespace fotomill::platform

@@ -1,0 +1,17 @@
+#pragma once
+
+#include "core/settings.h"
+
+namespace fotomill::test {
+
+// Restores every setting when the test ends.
+class ScopedSettings {
+ public:
+  ScopedSettings() : saved_(settings) {}
+  ~ScopedSettings() { settings = saved_; }
+
+ private:
+  Settings saved_;
+};
+
+}  // namespace fotomill::test
