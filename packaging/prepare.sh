@@ -1,0 +1,103 @@
+# Installs the packages of packages.txt and builds presets, for ./fotomill, ./check and fuzz/run. Sourced by bash with
+# `root` set to the project's folder. Everything said goes to standard error; logs lie in build/.
+
+Say() { printf '%s: %s\n' "${0##*/}" "$*" >&2; }
+Fail() {
+  Say "$*"
+  exit 1
+}
+
+# The packages of the given groups, one a line.
+PackagesOf() {
+  local line group='' wanted=" $* "
+  while read -r line || [[ -n $line ]]; do
+    line=${line%%#*}
+    line=${line//[[:space:]]/}
+    case $line in
+      '') ;;
+      '['*']') group=${line:1:-1} ;;
+      *) [[ $wanted == *" $group "* ]] && echo "$line" ;;
+    esac
+  done <"$root/packages.txt"
+}
+
+MissingPackages() {
+  local package installed
+  local -a packages
+  mapfile -t packages < <(PackagesOf "$@")
+  installed=$'\n'$(dpkg-query -W -f '${Package} ${db:Status-Status}\n' "${packages[@]}" 2>/dev/null)$'\n'
+  for package in "${packages[@]}"; do
+    [[ $installed == *$'\n'"$package installed"$'\n'* ]] || echo "$package"
+  done
+}
+
+# Installs what is missing of the given groups. With nothing missing it only asks dpkg.
+EnsurePackages() {
+  local -a missing apt
+  if ! command -v dpkg-query >/dev/null; then
+    Say "not a Debian or Ubuntu system; needed are the likes of:" $(PackagesOf "$@")
+    return 0
+  fi
+  mapfile -t missing < <(MissingPackages "$@")
+  ((${#missing[@]} > 0)) || return 0
+
+  # dpkg wants the folders of the system's own programs, which a plain `su` leaves out of the path.
+  apt=(env "PATH=$PATH:/usr/local/sbin:/usr/sbin:/sbin" DEBIAN_FRONTEND=noninteractive
+       apt-get -qq -y -o DPkg::Lock::Timeout=300 -o Dpkg::Use-Pty=0)
+  if ((EUID != 0)); then
+    command -v sudo >/dev/null || Fail "missing packages, and no sudo to install them; as root run:" \
+      "apt-get install --no-install-recommends ${missing[*]}"
+    apt=(sudo "${apt[@]}")
+  fi
+  Say "installing ${missing[*]}"
+  mkdir -p "$root/build"
+  # The lists that are there usually do; only when they do not are they fetched anew.
+  if ! "${apt[@]}" install --no-install-recommends "${missing[@]}" >"$root/build/packages.log" 2>&1; then
+    "${apt[@]}" update >>"$root/build/packages.log" 2>&1 &&
+      "${apt[@]}" install --no-install-recommends "${missing[@]}" >>"$root/build/packages.log" 2>&1 || {
+      tail -n 5 "$root/build/packages.log" >&2
+      Fail "could not install packages (build/packages.log); as root run:" \
+        "apt-get install --no-install-recommends ${missing[*]}"
+    }
+  fi
+  packagesChanged=1
+}
+
+# One build at a time in this tree, held until the script ends or ReleaseBuildLock.
+TakeBuildLock() {
+  mkdir -p "$root/build" 2>/dev/null && exec 9>"$root/build/.lock" || Fail "cannot write to $root/build"
+  flock -n 9 || {
+    Say "waiting for another build of this tree"
+    flock 9
+  }
+}
+ReleaseBuildLock() { exec 9>&-; }
+
+# Configure PRESET TARGET: only when it has never been done, packages came in, or the build does not know the target. A tree
+# that was moved or copied is configured afresh.
+Configure() {
+  local folder=$root/build/$1 cache=$root/build/$1/CMakeCache.txt
+  local -a fresh=()
+  if [[ -f $cache ]] && ! grep -qxF "CMAKE_HOME_DIRECTORY:INTERNAL=$root" "$cache"; then
+    fresh=(--fresh)
+  elif [[ -z ${packagesChanged:-} ]] && grep -qs "^build $2:" "$folder/build.ninja"; then
+    return 0
+  fi
+  mkdir -p "$folder"
+  (cd "$root" && cmake "${fresh[@]}" --preset "$1") >"$folder/configure.log" 2>&1 || {
+    tail -n 20 "$folder/configure.log" >&2
+    Fail "configuring build/$1 failed (build/$1/configure.log)"
+  }
+}
+
+# Build PRESET [TARGET...]: the errors are shown, the rest is in the preset's build.log; a terminal sees how far it is.
+Build() {
+  local folder=$root/build/$1 line
+  (shift; exec ninja -C "$folder" "$@") 2>&1 9>&- | tee "$folder/build.log" | while read -r line; do
+    [[ -t 2 && $line == '['* ]] && printf '\r%s \r' "${line%%]*}]" >&2
+  done
+  if ((PIPESTATUS[0] != 0)); then
+    grep -aE -A 3 'error|FAILED|undefined reference' "$folder/build.log" | head -n 40 >&2
+    Fail "building build/$1 failed (build/$1/build.log)"
+  fi
+}

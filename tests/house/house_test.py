@@ -1,0 +1,167 @@
+#!/usr/bin/env python3
+"""Holds the sources to the order of the house: who may include whom, where a system shows, how long a file may be.
+
+house_test.py [PROJECT] prints each breach as FILE:LINE: MESSAGE and fails if there is one. Before it judges the project it
+judges a small tree with one breach of every rule, so that a rule that no longer bites fails as well.
+"""
+import re
+import sys
+import tempfile
+from pathlib import Path
+
+# The rooms of src/ from the ground up. A file includes from its own room and from rooms of lower floors.
+FLOORS = [
+    ["platform"],
+    ["core"],
+    ["picture"],
+    ["processing"],
+    ["formats"],
+    ["registry"],  # the files of src/picture that know every codec
+    ["metadata", "catalog", "plugins"],
+    ["batch"],
+    ["cli", "desktop"],
+]
+FLOOR = {room: floor for floor, rooms in enumerate(FLOORS) for room in rooms}
+REGISTRY_FILES = {"registry", "load_picture", "write_picture"}
+
+# What only the folder of one system may include or ask for. Files are read and written through src/platform.
+SYSTEM_FOLDERS = {"src/platform/posix", "src/platform/windows"}
+SYSTEM_HEADER = re.compile(
+    r"(sys|linux|net|netinet|arpa|asm)/.*|(unistd|fcntl|dirent|dlfcn|pthread|poll|pwd|grp|termios|spawn|mntent|glob|ftw|"
+    r"sched|utime|signal|csignal|libgen|strings|windows|windowsx|winsock2|winioctl|shlobj|shellapi|direct|io|process)(\.h)?|"
+    r"filesystem|fstream")
+SYSTEM_MACRO = re.compile(r"\s*#\s*(if|elif|ifdef|ifndef).*(_WIN32|_WIN64|\bWIN32|__WINDOWS__|__linux|__unix|__APPLE__|__MINGW|_MSC_VER|"
+                          r"__FreeBSD__|__ANDROID__)")
+INCLUDE = re.compile(r'\s*#\s*include\s*(["<])([^">]+)[">]')
+
+LONGEST_FILE = 900
+DRAWERS = {"util", "utils", "misc", "common", "helper", "helpers", "stuff"}
+
+
+def room_of(path):
+    """The room of a file, given as its path below src/."""
+    parts = path.split("/")
+    if parts[0] == "picture" and parts[-1].split(".")[0] in REGISTRY_FILES:
+        return "registry"
+    return parts[0] if len(parts) > 1 else None
+
+
+def include_breaches(path, line):
+    """Breaches by one include line of the file src/`path`."""
+    match = INCLUDE.match(line)
+    if not match:
+        return
+    quoted, target = match.group(1) == '"', match.group(2)
+    own, other = room_of(path), room_of(target)
+    in_system_folder = any(f"src/{path}".startswith(folder + "/") for folder in SYSTEM_FOLDERS)
+    if quoted and other not in FLOOR:
+        yield f'"{target}" is not named from src/ with its room'
+    elif quoted and other != own and FLOOR[other] >= FLOOR.get(own, -1):
+        yield f"{own} may not include {other} ({target})"
+    elif quoted and any(f"src/{target}".startswith(folder + "/") for folder in SYSTEM_FOLDERS) and not in_system_folder:
+        yield f"{target} belongs to one system; include its door in src/platform"
+    if not quoted and SYSTEM_HEADER.fullmatch(target) and not in_system_folder:
+        yield f"<{target}> belongs behind a door of src/platform"
+    if not quoted and target.startswith("wx/") and own != "desktop":
+        yield f"<{target}> outside src/desktop"
+
+
+def circle_breaches(includes):
+    """Files that include each other, directly or around corners. `includes` maps a file to what it includes."""
+    state = {}
+
+    def visit(path, trail):
+        if state.get(path) == "done":
+            return
+        if path in trail:
+            yield path, 1, "includes itself: " + " -> ".join(trail[trail.index(path):] + [path])
+            return
+        for target in includes.get(path, []):
+            yield from visit(target, trail + [path])
+        state[path] = "done"
+
+    for path in sorted(includes):
+        yield from visit(path, [])
+
+
+def breaches(project):
+    """Every breach in a project as (file, line, message)."""
+    includes = {}
+    sources = [path for folder in ("src", "tests", "fuzz", "bench", "samples")
+               for path in sorted((project / folder).rglob("*")) if path.suffix in {".cpp", ".h", ".def", ".py", ".sh"}]
+    if not sources:
+        yield str(project), 1, "has no sources"
+    for source in sources:
+        name = source.relative_to(project).as_posix()
+        for part in Path(name).parts:
+            if part.split(".")[0] in DRAWERS:
+                yield name, 1, f'"{part}" is a drawer, not a subject'
+        lines = source.read_text(encoding="utf-8").splitlines()
+        if len(lines) > LONGEST_FILE:
+            yield name, len(lines), f"longer than {LONGEST_FILE} lines"
+        if not name.startswith("src/"):
+            continue
+        path = name[len("src/"):]
+        if path.split("/")[0] not in FLOOR:
+            yield name, 1, "is in no room that this test knows"
+        includes[name] = ["src/" + match.group(2) for match in map(INCLUDE.match, lines) if match and match.group(1) == '"']
+        for number, line in enumerate(lines, 1):
+            for message in include_breaches(path, line):
+                yield name, number, message
+            if SYSTEM_MACRO.match(line) and not any(name.startswith(folder + "/") for folder in SYSTEM_FOLDERS):
+                yield name, number, "asks which system it runs on outside src/platform"
+    yield from circle_breaches(includes)
+
+
+# One breach of each rule: file, contents, the message's tell-tale (None: must pass).
+EXAMPLES = [
+    ("src/core/text.cpp", '#include "core/text.h"\n#include <string>\n', None),
+    ("src/core/text.h", '#include "platform/files.h"\n', None),
+    ("src/platform/files.h", "", None),
+    ("src/platform/posix/files.cpp", '#include "platform/files.h"\n#include <unistd.h>\n#ifdef __linux__\n#endif\n', None),
+    ("src/picture/registry.cpp", '#include "formats/bmp.h"\n', None),
+    ("src/formats/bmp.h", '#include "picture/packed_image.h"\n', None),
+    ("src/picture/palette.h", '#include "formats/bmp.h"\n', "picture may not include formats"),
+    ("src/formats/pcx.cpp", '#include "picture/registry.h"\n', "formats may not include registry"),
+    ("src/catalog/thumb.cpp", '#include "plugins/bridge.h"\n', "catalog may not include plugins"),
+    ("src/cli/info.cpp", '#include "desktop/window.h"\n', "cli may not include desktop"),
+    ("src/core/near.cpp", '#include "near.h"\n', "not named from src/"),
+    ("src/core/own.cpp", '#include "platform/posix/own.h"\n', "belongs to one system"),
+    ("src/core/open.cpp", "#include <sys/stat.h>\n", "behind a door"),
+    ("src/core/stream.cpp", "#include <fstream>\n", "behind a door"),
+    ("src/core/switch.cpp", "#if defined(_WIN32)\n#endif\n", "asks which system"),
+    ("src/core/window.cpp", "#include <wx/wx.h>\n", "outside src/desktop"),
+    ("src/core/egg.h", '#include "core/hen.h"\n', "includes itself"),
+    ("src/core/hen.h", '#include "core/egg.h"\n', None),
+    ("src/core/long.cpp", "\n" * (LONGEST_FILE + 1), "longer than"),
+    ("src/core/common.h", "", "is a drawer"),
+    ("src/attic/box.cpp", "", "no room"),
+]
+
+
+def own_faults():
+    """Where the rules do not give what EXAMPLES say."""
+    with tempfile.TemporaryDirectory() as folder:
+        for name, contents, _ in EXAMPLES:
+            path = Path(folder, name)
+            path.parent.mkdir(parents=True, exist_ok=True)
+            path.write_text(contents)
+        found = {}
+        for name, _, message in breaches(Path(folder)):
+            found.setdefault(name, []).append(message)
+    for name, _, expected in EXAMPLES:
+        messages = found.get(name, [])
+        if expected is None and messages or expected is not None and not any(expected in message for message in messages):
+            yield f"example {name}: expected {expected}, found {messages}"
+
+
+def main():
+    project = Path(sys.argv[1]) if len(sys.argv) > 1 else Path(__file__).resolve().parents[2]
+    faults = list(own_faults())
+    faults += [f"{name}:{line}: {message}" for name, line, message in breaches(project)]
+    print("\n".join(faults) if faults else "the house is in order")
+    return 1 if faults else 0
+
+
+if __name__ == "__main__":
+    sys.exit(main())
