@@ -8,12 +8,21 @@ namespace {
 
 // clang-format off
 constexpr Command kCommands[] = {
-    {"match",   "tell which format a file name selects, without opening it", SetUpMatch},
+    {"match", "tell which format a file name selects, without opening it", Needs::Settings, SetUpMatch},
 };
 // clang-format on
 
 }  // namespace
 
-std::span<const Command> Commands() { return kCommands; }
+std::span<const Command> Commands() {
+  return kCommands;
+}
+
+const Command* FindCommand(std::string_view name) {
+  for (const Command& command : kCommands) {
+    if (command.name == name) return &command;
+  }
+  return nullptr;
+}
 
 }  // namespace fotomill::cli

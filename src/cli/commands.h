@@ -1,6 +1,7 @@
 #pragma once
 
 #include <span>
+#include <string_view>
 
 #include "cli/command.h"
 
@@ -8,5 +9,8 @@ namespace fotomill::cli {
 
 // All commands in the order of the help page.
 std::span<const Command> Commands();
+
+// The command of that name, one word or two; null when there is none.
+const Command* FindCommand(std::string_view name);
 
 }  // namespace fotomill::cli

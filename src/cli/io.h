@@ -4,11 +4,17 @@
 
 namespace fotomill::cli {
 
-// Where a command prints and what it may assume about the terminal; tests hand in files of their own.
+// Where a command reads and prints and what it may assume about the terminal; tests hand in files of their own.
 struct Io {
-  std::FILE* out = stdout;       // results only
-  std::FILE* err = stderr;       // messages
-  bool interactive = false;      // questions may be asked: standard input and standard error are terminals
+  std::FILE* in = stdin;
+  std::FILE* out = stdout;  // results only
+  std::FILE* err = stderr;  // messages
+  bool inTerminal = false;
+  bool outTerminal = false;
+  bool errTerminal = false;
+
+  // Questions may be asked: someone sees them and can answer.
+  bool Interactive() const { return inTerminal && errTerminal; }
 };
 
 }  // namespace fotomill::cli

@@ -1,3 +1,5 @@
 #include "cli/command.h"
 
-int main(int count, char** arguments) { return fotomill::cli::RunCommandLine(count, arguments, {}); }
+int main(int count, char** arguments) {
+  return fotomill::cli::RunCommandLine(count, arguments, {});
+}

@@ -3,7 +3,6 @@
 #include <CLI/CLI.hpp>
 #include <memory>
 #include <string>
-#include <vector>
 
 #include "picture/registry.h"
 
@@ -12,13 +11,12 @@ namespace fotomill::cli {
 namespace {
 
 struct MatchOptions {
-  std::vector<std::string> names;
   bool json = false;
 };
 
-int RunMatch(const MatchOptions& options, const Io& io) {
-  for (const std::string& name : options.names) {
-    std::fprintf(io.out, "%s\t%s\n", name.c_str(), DescribeFileType(name).c_str());
+int RunMatch(const MatchOptions&, const CommandContext& context) {
+  for (const std::string& name : context.names.values) {
+    std::fprintf(context.io.out, "%s\t%s\n", name.c_str(), DescribeFileType(name).c_str());
   }
   return kExitOk;
 }
@@ -27,10 +25,10 @@ int RunMatch(const MatchOptions& options, const Io& io) {
 
 void SetUpMatch(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<MatchOptions>();
-  app.add_option("NAME", options->names, "File names; they need not exist")->required();
-  app.add_flag("--json", options->json, "One JSON array");
+  context.names.Declare("NAME...", "File names; they need not exist", 1);
+  app.add_flag("--json", options->json, "One JSON array: {name, index, extension, typeName}");
   app.footer("Example: fotomill match scan.tiff photo.jpeg");
-  app.callback([options, &context] { context.exitStatus = RunMatch(*options, context.io); });
+  context.run = [options, &context] { return RunMatch(*options, context); };
 }
 
 }  // namespace fotomill::cli

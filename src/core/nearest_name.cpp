@@ -1,0 +1,56 @@
+#include "core/nearest_name.h"
+
+#include <algorithm>
+#include <vector>
+
+#include "core/text.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr size_t kLongestName = 64;  // longer texts are no slips of the hand, and the table below stays small
+
+// Number of characters to change, insert, delete or swap with their neighbour to turn `a` into `b`.
+size_t EditDistance(std::string_view a, std::string_view b) {
+  std::vector<size_t> beforeLast(b.size() + 1), last(b.size() + 1), row(b.size() + 1);
+  for (size_t j = 0; j <= b.size(); ++j) last[j] = j;
+  for (size_t i = 1; i <= a.size(); ++i) {
+    row[0] = i;
+    for (size_t j = 1; j <= b.size(); ++j) {
+      const size_t change = LowerCase(a[i - 1]) == LowerCase(b[j - 1]) ? 0 : 1;
+      row[j] = std::min({last[j] + 1, row[j - 1] + 1, last[j - 1] + change});
+      const bool swapped =
+          i > 1 && j > 1 && LowerCase(a[i - 1]) == LowerCase(b[j - 2]) && LowerCase(a[i - 2]) == LowerCase(b[j - 1]);
+      if (swapped) row[j] = std::min(row[j], beforeLast[j - 2] + 1);
+    }
+    std::swap(beforeLast, last);
+    std::swap(last, row);
+  }
+  return last[b.size()];
+}
+
+}  // namespace
+
+std::string_view NearestName(std::string_view typed, std::span<const std::string_view> names) {
+  if (typed.empty() || typed.size() > kLongestName) return {};
+  std::string_view nearest;
+  size_t fewest = typed.size() / 3 + 2;  // one slip in a short word, one more for every three letters
+  for (const std::string_view name : names) {
+    if (name.size() > kLongestName) continue;
+    const bool beginning = typed.size() >= 2 && EqualIgnoringCase(name.substr(0, typed.size()), typed);
+    const size_t distance = beginning ? 1 : EditDistance(typed, name);
+    if (distance < fewest && distance < std::max(typed.size(), name.size())) {
+      fewest = distance;
+      nearest = name;
+    }
+  }
+  return nearest;
+}
+
+std::string NearestNameHint(std::string_view typed, std::span<const std::string_view> names) {
+  const std::string_view nearest = NearestName(typed, names);
+  return nearest.empty() ? std::string() : " Did you mean \"" + std::string(nearest) + "\"?";
+}
+
+}  // namespace fotomill

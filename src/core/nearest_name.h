@@ -1,0 +1,16 @@
+#pragma once
+
+#include <span>
+#include <string>
+#include <string_view>
+
+namespace fotomill {
+
+// The name that someone who typed `typed` most likely meant: the one with the fewest wrong, missing, extra or swapped
+// characters, case ignored, or one that begins with what was typed. Empty when none is close; the first of equals.
+std::string_view NearestName(std::string_view typed, std::span<const std::string_view> names);
+
+// " Did you mean "NAME"?" for messages about an unknown name, empty when none is close.
+std::string NearestNameHint(std::string_view typed, std::span<const std::string_view> names);
+
+}  // namespace fotomill
