@@ -29,6 +29,9 @@ class FileView {
 
   std::span<const uint8_t> Bytes() const { return {data_, static_cast<size_t>(size_)}; }
   uint64_t FileSize() const { return fileSize_; }
+  // Copies the bytes of the file from `offset` on into `into`, also those that OpenHead left out, without making them a
+  // part of the view: the cheapest way to a block that holds them anyway. False when the file ends before, or on an error.
+  [[nodiscard]] bool ReadAt(uint64_t offset, std::span<uint8_t> into) const;
   // Whether every byte handed out so far really came from the file.
   bool Intact() const;
   // Says that bytes before `offset` will not be read again for now, so that a long file need not stay in memory. They
@@ -37,11 +40,13 @@ class FileView {
 
  private:
   [[nodiscard]] bool OpenPart(const char* path, uint64_t most);
+  [[nodiscard]] bool Map();
   const uint8_t* data_ = nullptr;
   uint64_t size_ = 0;
   uint64_t fileSize_ = 0;
   uint64_t dropped_ = 0;    // bytes given back so far, a multiple of the page size
   void* mapping_ = nullptr; // set when mapped
+  intptr_t handle_ = -1;    // the open file
   MemoryBlock copy_;        // holds the bytes when not mapped
 };
 

@@ -7,6 +7,8 @@
 #include <unistd.h>
 
 #include <atomic>
+#include <cerrno>
+#include <cstring>
 #include <mutex>
 #include <utility>
 
@@ -72,25 +74,18 @@ MappedRange* EnterRange(const void* data, uint64_t size) {
   return nullptr;
 }
 
-// Reads up to `size` bytes into `data`; the number of bytes read, or -1 on an error.
-int64_t ReadAll(int handle, uint8_t* data, uint64_t size) {
+// Reads up to `size` bytes at `offset` into `data`; the number of bytes read, or -1 on an error.
+int64_t ReadAll(int handle, uint64_t offset, uint8_t* data, uint64_t size) {
   uint64_t done = 0;
   while (done < size) {
-    const ssize_t count = read(handle, data + done, size - done);
+    const ssize_t count = pread(handle, data + done, size - done, static_cast<off_t>(offset + done));
+    if (count < 0 && errno == EINTR) continue;
     if (count < 0) return -1;
     if (count == 0) break;
     done += static_cast<uint64_t>(count);
   }
   return static_cast<int64_t>(done);
 }
-
-// An open handle that closes itself.
-struct Handle {
-  int number;
-  ~Handle() {
-    if (number >= 0) close(number);
-  }
-};
 
 }  // namespace
 
@@ -104,6 +99,7 @@ FileView& FileView::operator=(FileView&& other) noexcept {
     fileSize_ = std::exchange(other.fileSize_, 0);
     dropped_ = std::exchange(other.dropped_, 0);
     mapping_ = std::exchange(other.mapping_, nullptr);
+    handle_ = std::exchange(other.handle_, -1);
     copy_ = std::move(other.copy_);
   }
   return *this;
@@ -116,36 +112,50 @@ bool FileView::OpenHead(const char* path, uint64_t count) { return OpenPart(path
 bool FileView::OpenPart(const char* path, uint64_t most) {
   Close();
   if (FaultDue()) return false;
-  const Handle handle{open(path, O_RDONLY | O_CLOEXEC | O_NONBLOCK | O_NOCTTY)};
+  const int handle = open(path, O_RDONLY | O_CLOEXEC | O_NONBLOCK | O_NOCTTY);
+  if (handle < 0) return false;
+  handle_ = handle;
   struct stat facts;
-  if (handle.number < 0 || fstat(handle.number, &facts) != 0 || !S_ISREG(facts.st_mode)) return false;
-  const uint64_t fileSize = static_cast<uint64_t>(facts.st_size);
-  const uint64_t wanted = fileSize < most ? fileSize : most;
-  if (wanted >= kMappedFrom) {
-    void* data = mmap(nullptr, wanted, PROT_READ, MAP_PRIVATE, handle.number, 0);
-    if (data != MAP_FAILED) {
-      InstallBusHandler();
-      if (MappedRange* range = EnterRange(data, wanted)) {
-        madvise(data, wanted, MADV_SEQUENTIAL);
-        data_ = static_cast<const uint8_t*>(data);
-        mapping_ = range;
-        size_ = wanted;
-        fileSize_ = fileSize;
-        return true;
-      }
-      munmap(data, wanted);
-    }
-  }
-  if (!copy_.Allocate(wanted, Fill::Unset)) return false;
-  const int64_t count = FaultDue() ? -1 : ReadAll(handle.number, copy_.Data(), wanted);
-  if (count < 0) {
-    copy_.Free();
+  if (fstat(handle, &facts) != 0 || !S_ISREG(facts.st_mode)) {
+    Close();
     return false;
   }
+  fileSize_ = static_cast<uint64_t>(facts.st_size);
+  size_ = fileSize_ < most ? fileSize_ : most;
+  if (size_ >= kMappedFrom && Map()) return true;
+  const int64_t count =
+      FaultDue() || !copy_.Allocate(size_, Fill::Unset) ? -1 : ReadAll(handle, 0, copy_.Data(), size_);
+  if (count < 0) {
+    Close();
+    return false;
+  }
+  if (static_cast<uint64_t>(count) < size_) size_ = fileSize_ = static_cast<uint64_t>(count);
   data_ = copy_.Data();
-  size_ = static_cast<uint64_t>(count);
-  fileSize_ = count < static_cast<int64_t>(wanted) ? size_ : fileSize;
   return true;
+}
+
+bool FileView::Map() {
+  void* data = mmap(nullptr, size_, PROT_READ, MAP_PRIVATE, static_cast<int>(handle_), 0);
+  if (data == MAP_FAILED) return false;
+  InstallBusHandler();
+  mapping_ = EnterRange(data, size_);
+  if (mapping_ == nullptr) {
+    munmap(data, size_);
+    return false;
+  }
+  madvise(data, size_, MADV_SEQUENTIAL);
+  data_ = static_cast<const uint8_t*>(data);
+  return true;
+}
+
+bool FileView::ReadAt(uint64_t offset, std::span<uint8_t> into) const {
+  if (into.size() > fileSize_ || offset > fileSize_ - into.size()) return false;
+  if (mapping_ == nullptr && offset + into.size() <= size_) {
+    if (!into.empty()) std::memcpy(into.data(), data_ + offset, into.size());
+    return true;
+  }
+  return !FaultDue() && ReadAll(static_cast<int>(handle_), offset, into.data(), into.size()) ==
+                            static_cast<int64_t>(into.size());
 }
 
 void FileView::Close() {
@@ -154,6 +164,8 @@ void FileView::Close() {
     static_cast<MappedRange*>(mapping_)->begin = 0;
     mapping_ = nullptr;
   }
+  if (handle_ >= 0) close(static_cast<int>(handle_));
+  handle_ = -1;
   copy_.Free();
   data_ = nullptr;
   size_ = fileSize_ = dropped_ = 0;
