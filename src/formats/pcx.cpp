@@ -1,9 +1,373 @@
+// PC Paintbrush (PCX), little-endian.
+//
+//   offset size  field
+//        0    1  manufacturer, always 10
+//        1    1  version; 3: the fixed sixteen colours; from 5 on an 8-bit file may end in a palette; written 5
+//        2    1  encoding, written 1; not read: data are always run-length coded
+//        3    1  bits per pixel and plane
+//        4    8  xmin, ymin, xmax, ymax, the corners; written 0, 0, width - 1, height - 1
+//       12    4  two resolutions, written 300
+//       16   48  palette of sixteen colours
+//       64    1  reserved
+//       65    1  planes
+//       66    2  bytes per line and plane, used as stored; written without rounding up
+//       68    2  palette information, written 1, or 0 with 24 bits
+//       70   58  filler
+//      128       lines from the top, each with its planes one after the other
+//   end - 769    12 and a palette of 256 colours, with 8 bits
+//
+// Palettes are red, green, blue. A byte of 0xC0 or more counts in its low six bits how often the byte after it comes;
+// any other byte stands for itself.
+//
+// The reader carries runs on from line to line, and takes two bits in one plane (CGA) beside the combinations that it
+// writes. The writer codes every plane of every line on its own, and leaves the last byte of a run to the token after
+// it. Source: ZSoft Corporation, "PCX Technical Reference Manual" (1991).
 #include "formats/pcx.h"
+
+#include <algorithm>
+#include <array>
+#include <cstring>
+
+#include "core/byte_reader.h"
+#include "core/byte_writer.h"
+#include "platform/file_view.h"
 
 namespace fotomill {
 
-Status PcxInfo(PictureRecord&, const char*, uint32_t) { return Status::UnsupportedFunction; }
-Status PcxRead(PictureRecord&, const char*) { return Status::UnsupportedFunction; }
-Status PcxWrite(PictureRecord&, const WriteOptions&) { return Status::UnsupportedFunction; }
+namespace {
+
+constexpr uint64_t kHeaderSize = 128;
+constexpr uint8_t kManufacturer = 10;
+constexpr uint8_t kVersionFixedColors = 3, kVersionTrailer = 5;
+constexpr uint16_t kResolution = 300;
+constexpr size_t kHeaderPaletteSize = 48;
+constexpr uint8_t kTrailerMark = 12;
+constexpr uint64_t kTrailerSize = 1 + 768;
+
+constexpr uint8_t kRunMark = 0xC0;  // both top bits: a count byte
+constexpr size_t kLongestRun = 63;
+
+// The palette of version 3 files, which hold none.
+constexpr std::array<uint8_t, kHeaderPaletteSize> kFixedColors = {
+    0x00, 0x00, 0x00, 0x00, 0x00, 0xAA, 0x00, 0xAA, 0x00, 0x00, 0xAA, 0xAA, 0xAA, 0x00, 0x00, 0xAA,
+    0x00, 0xAA, 0xAA, 0x55, 0x00, 0xAA, 0xAA, 0xAA, 0x55, 0x55, 0x55, 0x55, 0x55, 0xFF, 0x55, 0xFF,
+    0x55, 0x55, 0xFF, 0xFF, 0xFF, 0x55, 0x55, 0xFF, 0x55, 0xFF, 0xFF, 0xFF, 0x55, 0xFF, 0xFF, 0xFF};
+
+struct PcxHeader {
+  uint8_t version = 0;
+  uint8_t bitsPerPlane = 0;
+  uint8_t planes = 0;
+  int32_t width = 0, height = 0;  // 1 to 65536 when valid
+  uint16_t bytesPerLine = 0;      // of one plane
+  std::array<uint8_t, kHeaderPaletteSize> palette{};
+
+  size_t LineSize() const { return size_t{bytesPerLine} * planes; }
+};
+
+// Turns a decoded line of `header.LineSize()` bytes into a whole row of the picture, padding included. Pixels that the
+// line does not hold become 0.
+using SpreadRow = void (*)(std::span<const uint8_t> line, const PcxHeader& header, std::span<uint8_t> row);
+
+void CopyRow(std::span<const uint8_t> line, const PcxHeader&, std::span<uint8_t> row) {
+  const size_t count = std::min(line.size(), row.size());
+  std::memcpy(row.data(), line.data(), count);
+  std::memset(row.data() + count, 0, row.size() - count);
+}
+
+// One bit of each of 2 to 4 planes makes a 4-bit pixel, the first plane its lowest bit.
+void SpreadBitPlanes(std::span<const uint8_t> line, const PcxHeader& header, std::span<uint8_t> row) {
+  std::memset(row.data(), 0, row.size());
+  const int32_t width = std::min(header.width, header.bytesPerLine * 8);
+  for (int32_t x = 0; x < width; ++x) {
+    int32_t index = 0;
+    for (int32_t p = 0; p < header.planes; ++p) {
+      index |= (line[static_cast<size_t>(p * header.bytesPerLine + x / 8)] >> (7 - x % 8) & 1) << p;
+    }
+    row[static_cast<size_t>(x / 2)] |= static_cast<uint8_t>(x % 2 == 0 ? index << 4 : index);
+  }
+}
+
+// Four 2-bit pixels of a byte become four 4-bit ones.
+void SpreadPairs(std::span<const uint8_t> line, const PcxHeader& header, std::span<uint8_t> row) {
+  std::memset(row.data(), 0, row.size());
+  const int32_t width = std::min(header.width, header.bytesPerLine * 4);
+  for (int32_t x = 0; x < width; ++x) {
+    const int32_t index = line[static_cast<size_t>(x / 4)] >> (6 - x % 4 * 2) & 3;
+    row[static_cast<size_t>(x / 2)] |= static_cast<uint8_t>(x % 2 == 0 ? index << 4 : index);
+  }
+}
+
+// A red, a green and a blue plane become pixels of blue, green, red.
+void MergeColorPlanes(std::span<const uint8_t> line, const PcxHeader& header, std::span<uint8_t> row) {
+  const size_t count = std::min<size_t>(header.width, header.bytesPerLine);
+  const uint8_t* red = line.data();
+  const uint8_t* green = red + header.bytesPerLine;
+  const uint8_t* blue = green + header.bytesPerLine;
+  for (size_t x = 0; x < count; ++x) {
+    row[3 * x] = blue[x];
+    row[3 * x + 1] = green[x];
+    row[3 * x + 2] = red[x];
+  }
+  std::memset(row.data() + 3 * count, 0, row.size() - 3 * count);
+}
+
+// The arrangements of planes that can be read, and what they are read as.
+struct Arrangement {
+  uint8_t bitsPerPlane;
+  uint8_t planes;
+  int32_t depth;
+  SpreadRow spread;
+};
+// clang-format off
+constexpr Arrangement kArrangements[] = {
+    //bits planes depth spread
+    {1,    1,     1,    CopyRow},
+    {1,    2,     2,    SpreadBitPlanes},
+    {1,    3,     3,    SpreadBitPlanes},
+    {1,    4,     4,    SpreadBitPlanes},
+    {2,    1,     2,    SpreadPairs},
+    {4,    1,     4,    CopyRow},
+    {8,    1,     8,    CopyRow},
+    {8,    3,     24,   MergeColorPlanes},
+};
+// clang-format on
+
+// Null for a combination that is not in the table.
+const Arrangement* FindArrangement(const PcxHeader& header) {
+  for (const Arrangement& row : kArrangements) {
+    if (row.bitsPerPlane == header.bitsPerPlane && row.planes == header.planes) return &row;
+  }
+  return nullptr;
+}
+
+// Ok, or DamagedFile when the header is short, of another format, or leaves nothing to decode.
+Status ParseHeader(std::span<const uint8_t> file, PcxHeader& header) {
+  ByteReader bytes(file);
+  const uint8_t manufacturer = bytes.U8();
+  header.version = bytes.U8();
+  bytes.Skip(1);  // encoding
+  header.bitsPerPlane = bytes.U8();
+  const uint16_t xMin = bytes.Le16(), yMin = bytes.Le16();
+  header.width = bytes.Le16() - xMin + 1;
+  header.height = bytes.Le16() - yMin + 1;
+  bytes.Skip(4);  // resolutions
+  const std::span<const uint8_t> palette = bytes.Take(kHeaderPaletteSize);
+  std::copy(palette.begin(), palette.end(), header.palette.begin());
+  bytes.Skip(1);
+  header.planes = bytes.U8();
+  header.bytesPerLine = bytes.Le16();
+  bytes.Seek(kHeaderSize);
+  const bool sizesValid = header.width > 0 && header.height > 0 && header.bytesPerLine > 0;
+  const bool valid = bytes.Ok() && manufacturer == kManufacturer && sizesValid && FindArrangement(header) != nullptr;
+  return valid ? Status::Ok : Status::DamagedFile;
+}
+
+// Fills `palette` with what the header's version and depth call for. FileReadError when a palette at the end is there
+// but cannot be read.
+Status ReadPalette(const platform::FileView& file, const PcxHeader& header, int32_t depth, Palette& palette) {
+  MakeDefaultPalette(&palette, nullptr, depth == 24 ? kDisplayPalette : kBlackAndWhitePalette);
+  if (depth == 1 || depth == 24) return Status::Ok;
+  if (depth == 8 && header.version >= kVersionTrailer && file.FileSize() >= kTrailerSize) {
+    std::array<uint8_t, kTrailerSize> trailer;
+    if (!file.ReadAt(file.FileSize() - kTrailerSize, trailer)) return Status::FileReadError;
+    if (trailer[0] == kTrailerMark) {
+      std::copy(trailer.begin() + 1, trailer.end(), palette.begin());
+      return Status::Ok;
+    }
+  }
+  const auto& colors = header.version == kVersionFixedColors ? kFixedColors : header.palette;
+  std::copy(colors.begin(), colors.end(), palette.begin());
+  return Status::Ok;
+}
+
+// Parses the header and fills the record's facts.
+Status DescribePicture(const platform::FileView& file, PictureRecord& picture, PcxHeader& header) {
+  picture.typeName.Clear();
+  picture.fileSize = file.FileSize();
+  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
+  picture.width = header.width;
+  picture.height = header.height;
+  picture.bitsPerPixel = FindArrangement(header)->depth;
+  picture.imageBytes = (picture.bitsPerPixel == 24 ? header.LineSize() : header.bytesPerLine) * uint64_t(header.height);
+  picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
+  return ReadPalette(file, header, picture.bitsPerPixel, picture.palette);
+}
+
+// What a line left of its last run for the line after it.
+struct PendingRun {
+  size_t count = 0;
+  uint8_t value = 0;
+};
+
+// Decodes one line. A run that the line before left over is in `run`, which is empty before the first line. Ok, or
+// FileReadError when the data end inside the line.
+Status DecodeLine(ByteReader& bytes, PendingRun& run, std::span<uint8_t> line) {
+  size_t place = 0;
+  for (;;) {
+    const size_t repeated = std::min(run.count, line.size() - place);
+    std::memset(line.data() + place, run.value, repeated);
+    place += repeated;
+    run.count -= repeated;
+    if (place == line.size()) return Status::Ok;
+    const uint8_t byte = bytes.U8();
+    if (byte < kRunMark) {
+      run = {1, byte};
+    } else {
+      run = {static_cast<size_t>(byte & kLongestRun), bytes.U8()};
+    }
+    if (!bytes.Ok()) return Status::FileReadError;
+  }
+}
+
+// Codes one plane of a line; returns the number of bytes written, at most twice the plane's. Of a run of equal bytes
+// the last is left to the next token, so that m equal bytes cost a pair for m - 1 of them and one token more.
+size_t EncodePlane(std::span<const uint8_t> plane, uint8_t* out) {
+  const uint8_t* const begin = out;
+  for (size_t i = 0; i < plane.size();) {
+    size_t equal = 0;
+    while (equal < kLongestRun && i + equal + 1 < plane.size() && plane[i + equal] == plane[i + equal + 1]) ++equal;
+    if (equal > 0 || plane[i] >= kRunMark) *out++ = static_cast<uint8_t>(kRunMark + std::max<size_t>(equal, 1));
+    *out++ = plane[i];
+    i += std::max<size_t>(equal, 1);
+  }
+  return static_cast<size_t>(out - begin);
+}
+
+// What the writer stores for a picture.
+struct PcxLayout {
+  int32_t depth = 0;  // 1, 2, 3, 4, 8 or 24
+  uint8_t bitsPerPlane = 0;
+  uint8_t planes = 0;
+  uint16_t bytesPerLine = 0;  // of one plane
+};
+
+// UnsuitableImage when a size does not fit its field.
+Status ChooseLayout(const PictureRecord& picture, PcxLayout& layout) {
+  const PackedImage& image = picture.image;
+  const bool planar = image.Bits() == 4 && picture.bitsPerPixel >= 2 && picture.bitsPerPixel <= 4;
+  layout.depth = planar ? picture.bitsPerPixel : image.Bits();
+  layout.bitsPerPlane = layout.depth <= 4 ? 1 : 8;
+  layout.planes = static_cast<uint8_t>(layout.depth == 24 ? 3 : layout.depth <= 4 ? layout.depth : 1);
+  const int32_t bytesPerLine = layout.depth <= 4 ? (image.Width() + 7) / 8 : image.Width();
+  if (bytesPerLine > UINT16_MAX || image.Width() - 1 > UINT16_MAX || image.Height() - 1 > UINT16_MAX) {
+    return Status::UnsuitableImage;
+  }
+  layout.bytesPerLine = static_cast<uint16_t>(bytesPerLine);
+  return Status::Ok;
+}
+
+void WriteHeader(ByteWriter& out, const PcxLayout& layout, const PictureRecord& picture) {
+  out.U8(kManufacturer);
+  out.U8(kVersionTrailer);
+  out.U8(1);
+  out.U8(layout.bitsPerPlane);
+  out.Zeros(4);
+  out.Le16(static_cast<uint16_t>(picture.image.Width() - 1));
+  out.Le16(static_cast<uint16_t>(picture.image.Height() - 1));
+  out.Le16(kResolution);
+  out.Le16(kResolution);
+  out.Bytes(std::span(picture.palette).first(kHeaderPaletteSize));
+  out.U8(0);
+  out.U8(layout.planes);
+  out.Le16(layout.bytesPerLine);
+  out.Le16(layout.depth == 24 ? 0 : 1);
+  out.Zeros(kHeaderSize - 70);
+}
+
+// Takes the planes of a row apart, `bytesPerLine` bytes each, one after the other.
+using SplitRow = void (*)(std::span<const uint8_t> row, int32_t width, const PcxLayout& layout,
+                          std::span<uint8_t> planes);
+
+void CopyPlane(std::span<const uint8_t> row, int32_t, const PcxLayout&, std::span<uint8_t> planes) {
+  std::copy_n(row.begin(), planes.size(), planes.begin());
+}
+
+void SplitBitPlanes(std::span<const uint8_t> row, int32_t width, const PcxLayout& layout, std::span<uint8_t> planes) {
+  std::fill(planes.begin(), planes.end(), uint8_t{0});
+  for (int32_t x = 0; x < width; ++x) {
+    const int32_t index = row[static_cast<size_t>(x / 2)] >> (x % 2 == 0 ? 4 : 0) & 15;
+    for (int32_t p = 0; p < layout.planes; ++p) {
+      if ((index >> p & 1) != 0)
+        planes[static_cast<size_t>(p * layout.bytesPerLine + x / 8)] |= static_cast<uint8_t>(0x80 >> x % 8);
+    }
+  }
+}
+
+void SplitColorPlanes(std::span<const uint8_t> row, int32_t width, const PcxLayout&, std::span<uint8_t> planes) {
+  const size_t count = static_cast<size_t>(width);
+  for (size_t x = 0; x < count; ++x) {
+    planes[x] = row[3 * x + 2];
+    planes[count + x] = row[3 * x + 1];
+    planes[2 * count + x] = row[3 * x];
+  }
+}
+
+void WriteLines(ByteWriter& out, const PcxLayout& layout, const PictureRecord& picture, std::span<uint8_t> planes) {
+  const PackedImage& image = picture.image;
+  const SplitRow split = layout.depth == 24 ? SplitColorPlanes : layout.planes > 1 ? SplitBitPlanes : CopyPlane;
+  for (int32_t y = 0; y < image.Height() && !out.Failed(); ++y) {
+    picture.ReportRow(y);
+    split(image.Row(y), image.Width(), layout, planes);
+    for (size_t begin = 0; begin < planes.size(); begin += layout.bytesPerLine) {
+      out.Used(EncodePlane(planes.subspan(begin, layout.bytesPerLine), out.Reserve(2 * size_t{layout.bytesPerLine})));
+    }
+  }
+}
+
+}  // namespace
+
+Status PcxInfo(PictureRecord& picture, const char* fileName, uint32_t) {
+  platform::FileView file;
+  if (!file.OpenHead(fileName, kHeaderSize)) return Status::FileOpenError;
+  PcxHeader header;
+  return DescribePicture(file, picture, header);
+}
+
+Status PcxRead(PictureRecord& picture, const char* fileName) {
+  const ProgressScope progress(picture);
+  picture.image.Free();
+  picture.alpha.Free();
+  platform::FileView file;
+  if (!file.Open(fileName)) return Status::FileOpenError;
+  PcxHeader header;
+  RETURN_IF_BAD(DescribePicture(file, picture, header));
+
+  PackedImage image;
+  platform::MemoryBlock line;
+  RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette, picture.bitsPerPixel, image,
+                               platform::Fill::Unset));
+  if (!line.Allocate(header.LineSize())) return Status::MemoryAllocationError;
+  const SpreadRow spread = FindArrangement(header)->spread;
+  ByteReader bytes(file.Bytes());
+  bytes.Seek(kHeaderSize);
+  PendingRun run;
+  for (int32_t y = 0; y < header.height; ++y) {
+    RETURN_IF_BAD(DecodeLine(bytes, run, line.Bytes()));
+    spread(line.Bytes(), header, image.Row(y));
+    file.DropBefore(bytes.Position());
+    picture.ReportRow(y);
+  }
+  if (!file.Intact()) return Status::FileReadError;
+  picture.image = std::move(image);
+  return Status::Ok;
+}
+
+Status PcxWrite(PictureRecord& picture, const WriteOptions& options) {
+  const ProgressScope progress(picture);
+  if (picture.image.Empty()) return Status::MemoryAllocationError;
+  PcxLayout layout;
+  RETURN_IF_BAD(ChooseLayout(picture, layout));
+  platform::MemoryBlock planes;
+  if (!planes.Allocate(uint64_t{layout.bytesPerLine} * layout.planes)) return Status::MemoryAllocationError;
+  ByteWriter out;
+  if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
+  WriteHeader(out, layout, picture);
+  WriteLines(out, layout, picture, planes.Bytes());
+  if (layout.depth == 8) {
+    out.U8(kTrailerMark);
+    out.Bytes(picture.palette);
+  }
+  return CommitOutput(out, options);
+}
 
 }  // namespace fotomill
