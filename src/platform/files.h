@@ -22,7 +22,8 @@ struct FileFacts {
   uint64_t device = 0, identity = 0;  // together they name the file itself, whatever its path
 };
 
-// Facts of the file that `path` leads to, through links. Missing is a kind, not an error.
+// Facts of the file that `path` leads to, through links. Missing is a kind, not an error. What cannot be asked (a folder on
+// the way may not be searched) is Other: nobody may take it for free.
 FileFacts FactsOf(const std::string& path);
 bool FileExists(const std::string& path);       // anything of that name, a dangling link included
 bool IsRegularFile(const std::string& path);
@@ -31,8 +32,8 @@ bool IsFolder(const std::string& path);
 // Names in a folder, without "." and "..", in byte order. nullopt when it cannot be read.
 struct FolderEntry {
   std::string name;
-  FileKind kind;   // of the entry itself: a link is Other unless `link` says what it leads to
-  bool link;
+  FileKind kind;  // of a link: what it leads to, Other when that is nothing
+  bool link;      // the entry is a symbolic link; who walks down folders does not follow these
 };
 std::optional<std::vector<FolderEntry>> ListFolder(const std::string& path);
 // Makes a folder with its parents; true when it is there afterwards.
@@ -40,7 +41,8 @@ std::optional<std::vector<FolderEntry>> ListFolder(const std::string& path);
 
 // Deletes one file, never a folder. A path's final link is deleted itself.
 [[nodiscard]] bool DeleteFile(const std::string& path);
-// Renames within one file system.
+// Renames within one file system. A destination that is there and neither a regular file nor a link stays: Failed. Where
+// case does not count, a name may be changed to itself in other case.
 [[nodiscard]] CommitResult RenameFile(const std::string& from, const std::string& to, Existing existing);
 // Moves a file or folder into the system's trash, from which its user can bring it back. False when there is none for
 // it; nothing has happened then.
@@ -48,17 +50,17 @@ std::optional<std::vector<FolderEntry>> ListFolder(const std::string& path);
 // Whether MoveToTrash can work for that path, without doing it.
 bool HasTrash(const std::string& path);
 
-// The attribute that keeps a file out of listings. Systems whose hidden files are a matter of their names answer true and
-// change nothing.
+// The attribute that keeps a file out of listings. Where hidden is what begins with a dot, SetHidden answers true and
+// changes nothing.
 [[nodiscard]] bool SetHidden(const std::string& path, bool hidden);
 bool IsHidden(const std::string& path);
 // Clears hidden and read-only.
 [[nodiscard]] bool SetNormal(const std::string& path);
-// Gives a file the modification time of another.
+// Gives a file the modification time of another, as finely as the system keeps it.
 [[nodiscard]] bool CopyTimes(const std::string& from, const std::string& to);
 
 // A small whole file, at most `most` bytes. Missing and unreadable are told apart: who would overwrite a file that it
-// could not read loses it.
+// could not read loses it. A link that leads nowhere has failed. `contents` is empty unless Done.
 enum class ReadResult { Done, Missing, Failed, TooLarge };
 ReadResult ReadWholeFile(const std::string& path, uint64_t most, std::string& contents);
 // Replaces a file's contents in one step, synced. False leaves the old file as it was.

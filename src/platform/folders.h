@@ -9,9 +9,9 @@ enum class SpecialFolder {
   ApplicationData,  // $XDG_CONFIG_HOME, else ~/.config; on Windows the roaming application data (CSIDL 26)
   Cache,            // $XDG_CACHE_HOME, else ~/.cache
   Home,
-  Pictures,
-  Documents,
-  Temporary,
+  Pictures,   // as the user named it (user-dirs.dirs), else ~/Pictures where there is one, else the home folder
+  Documents,  // likewise
+  Temporary,  // $TMPDIR where it is a folder, else /tmp
 };
 std::string SpecialFolderPath(SpecialFolder folder);
 
@@ -19,7 +19,8 @@ std::string SpecialFolderPath(SpecialFolder folder);
 std::string ProgramPath();
 std::string ProgramFolder();
 std::string CurrentFolder();
-// A relative path made absolute against the current folder, with "." and ".." taken out; links stay.
+// A relative path made absolute against the current folder, with "." and ".." taken out and no closing separator; links
+// stay. Without a current folder (it was deleted) a relative path comes back as it is.
 std::string AbsolutePath(const std::string& path);
 
 }  // namespace fotomill::platform

@@ -7,14 +7,18 @@ namespace fotomill::platform {
 
 // The program registered for a file, as an argument vector that opens it; empty when there is none.
 std::vector<std::string> ProgramFor(const std::string& file);
-// Starts a program with its arguments, without a shell. `wait` blocks until it has ended. False when it cannot start.
+// Starts a program with its arguments, without a shell. A name without separator is looked up in the absolute folders of
+// PATH, never in the current one. `wait` blocks until it has ended; without it the program lives on its own, away from this
+// one's terminal input, output and Ctrl-C. False when it cannot start.
 [[nodiscard]] bool RunProgram(const std::vector<std::string>& arguments, bool wait);
 
 bool IsTerminal(int stream);  // 0 standard input, 1 output, 2 error
 int TerminalWidth();          // columns, 80 when unknown
-unsigned CoreCount();
-// Sets a flag when the user (Ctrl-C) or the system asks the program to end; returns the exit status that belongs to it
-// through `PendingExit`: 130 or 143, 0 while nothing was asked.
+unsigned CoreCount();         // cores this process may use, at least 1
+
+// From here on Ctrl-C and the system's request to end are remembered instead of ending the program at once, and
+// `PendingExit` returns the exit status that belongs to them: 130 or 143, 0 while nothing was asked. A second request ends
+// the program at once. A request that was ignored when the program started (nohup) stays ignored.
 void CatchTermination();
 int PendingExit();
 

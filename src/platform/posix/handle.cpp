@@ -1,0 +1,131 @@
+#include "platform/posix/handle.h"
+
+#include <fcntl.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cerrno>
+#include <cstdio>
+
+#include "platform/paths.h"
+
+namespace fotomill::platform {
+
+namespace {
+
+constexpr uint64_t kMostAtOnce = uint64_t{1} << 30;  // one read or write; the system takes at most 2 GiB
+
+// Whether both names lead to one entry of a folder: one file with a single name, as "a.jpg" and "A.JPG" are where case
+// does not count.
+bool OneEntry(const std::string& from, const std::string& to) {
+  struct stat first, second;
+  return lstat(from.c_str(), &first) == 0 && lstat(to.c_str(), &second) == 0 && first.st_dev == second.st_dev &&
+         first.st_ino == second.st_ino && first.st_nlink == 1 && from != to;
+}
+
+CommitResult RenameByLink(const std::string& from, const std::string& to) {
+  if (linkat(AT_FDCWD, from.c_str(), AT_FDCWD, to.c_str(), 0) != 0) {
+    return errno == EEXIST ? CommitResult::Taken : CommitResult::Failed;
+  }
+  if (unlink(from.c_str()) == 0) return CommitResult::Done;
+  unlink(to.c_str());
+  return CommitResult::Failed;
+}
+
+CommitResult RenameOverPlaceholder(const std::string& from, const std::string& to) {
+  struct stat facts;
+  if (lstat(from.c_str(), &facts) != 0 || S_ISDIR(facts.st_mode)) return CommitResult::Failed;
+  if (!OpenHandle(to.c_str(), O_WRONLY | O_CREAT | O_EXCL, 0600).IsOpen()) {
+    return errno == EEXIST ? CommitResult::Taken : CommitResult::Failed;
+  }
+  if (std::rename(from.c_str(), to.c_str()) == 0) return CommitResult::Done;
+  unlink(to.c_str());
+  return CommitResult::Failed;
+}
+
+}  // namespace
+
+bool Handle::Reset(int number) {
+  const int old = number_;
+  number_ = number;
+  return old < 0 || close(old) == 0 || errno == EINTR;  // interrupted: the descriptor is closed all the same
+}
+
+Handle OpenHandle(const char* path, int flags, mode_t mode) {
+  int number;
+  do {
+    number = open(path, flags | O_CLOEXEC, mode);
+  } while (number < 0 && errno == EINTR);
+  return Handle(number);
+}
+
+Handle OpenRegular(const char* path, int flags, struct stat& facts) {
+  if (stat(path, &facts) != 0) return Handle();
+  if (!S_ISREG(facts.st_mode)) {
+    errno = S_ISDIR(facts.st_mode) ? EISDIR : EINVAL;
+    return Handle();
+  }
+  Handle handle = OpenHandle(path, flags | O_NONBLOCK | O_NOCTTY);
+  if (!handle.IsOpen() || fstat(handle.Number(), &facts) != 0) return Handle();
+  if (S_ISREG(facts.st_mode)) return handle;
+  handle.Reset();
+  errno = EINVAL;
+  return Handle();
+}
+
+int64_t ReadFully(int handle, uint8_t* data, uint64_t size, int64_t offset) {
+  uint64_t done = 0;
+  while (done < size) {
+    const size_t part = static_cast<size_t>(std::min(size - done, kMostAtOnce));
+    const ssize_t count = offset < 0 ? read(handle, data + done, part)
+                                     : pread(handle, data + done, part, offset + static_cast<int64_t>(done));
+    if (count < 0 && errno == EINTR) continue;
+    if (count < 0) return -1;
+    if (count == 0) break;
+    done += static_cast<uint64_t>(count);
+  }
+  return static_cast<int64_t>(done);
+}
+
+bool WriteFully(int handle, const uint8_t* data, uint64_t size, int64_t offset) {
+  uint64_t done = 0;
+  while (done < size) {
+    const size_t part = static_cast<size_t>(std::min(size - done, kMostAtOnce));
+    const ssize_t count = offset < 0 ? write(handle, data + done, part)
+                                     : pwrite(handle, data + done, part, offset + static_cast<int64_t>(done));
+    if (count < 0 && errno == EINTR) continue;
+    if (count <= 0) return false;
+    done += static_cast<uint64_t>(count);
+  }
+  return true;
+}
+
+bool SyncHandle(int handle) {
+  int result;
+  do {
+    result = fsync(handle);
+  } while (result != 0 && errno == EINTR);
+  return result == 0;
+}
+
+void SyncFolderOf(const std::string& path) {
+  const std::string folder(SplitPath(path).folder);
+  const Handle handle = OpenHandle(folder.empty() ? "." : folder.c_str(), O_RDONLY | O_DIRECTORY);
+  if (handle.IsOpen()) SyncHandle(handle.Number());
+}
+
+CommitResult RenameRefusing(const std::string& from, const std::string& to) {
+  if (renameat2(AT_FDCWD, from.c_str(), AT_FDCWD, to.c_str(), RENAME_NOREPLACE) == 0) return CommitResult::Done;
+  if (errno == EEXIST && OneEntry(from, to)) {
+    return std::rename(from.c_str(), to.c_str()) == 0 ? CommitResult::Done : CommitResult::Failed;
+  }
+  if (errno == EEXIST) return CommitResult::Taken;
+  if (errno != EINVAL && errno != ENOSYS && errno != EOPNOTSUPP) return CommitResult::Failed;
+  const CommitResult result = RenameByLink(from, to);
+  if (result == CommitResult::Failed && (errno == EPERM || errno == EOPNOTSUPP || errno == ENOSYS)) {
+    return RenameOverPlaceholder(from, to);
+  }
+  return result;
+}
+
+}  // namespace fotomill::platform

@@ -1,0 +1,148 @@
+#include "platform/process.h"
+
+#include <fcntl.h>
+#include <sched.h>
+#include <signal.h>
+#include <spawn.h>
+#include <sys/ioctl.h>
+#include <sys/stat.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <atomic>
+#include <cerrno>
+#include <cstdlib>
+#include <string_view>
+#include <system_error>
+#include <thread>
+
+#include "platform/fault.h"
+#include "platform/files.h"
+#include "platform/folders.h"
+#include "platform/paths.h"
+
+extern char** environ;
+
+namespace fotomill::platform {
+
+namespace {
+
+std::atomic<int> pendingExit{0};
+static_assert(std::atomic<int>::is_always_lock_free, "the handler may only touch lock-free objects");
+
+void OnTermination(int signalNumber) {
+  int none = 0;
+  if (pendingExit.compare_exchange_strong(none, 128 + signalNumber)) return;
+  signal(signalNumber, SIG_DFL);
+  raise(signalNumber);  // delivered when this handler returns
+}
+
+bool IsProgram(const std::string& path) { return IsRegularFile(path) && access(path.c_str(), X_OK) == 0; }
+
+// The file of a program given by name or path; empty when there is none.
+std::string FindProgram(const std::string& name) {
+  if (name.find('/') != std::string::npos) return IsProgram(name) ? name : std::string();
+  const char* path = std::getenv("PATH");
+  if (name.empty() || path == nullptr) return {};
+  for (std::string_view rest = path; !rest.empty();) {
+    const std::string_view folder = rest.substr(0, rest.find(':'));
+    rest.remove_prefix(folder.size() == rest.size() ? rest.size() : folder.size() + 1);
+    if (!folder.starts_with('/')) continue;
+    std::string program = JoinFolder(folder, name);
+    if (IsProgram(program)) return program;
+  }
+  return {};
+}
+
+int WaitFor(pid_t child) {
+  int status = 0;
+  while (waitpid(child, &status, 0) < 0 && errno == EINTR) {
+  }
+  return status;
+}
+
+// posix_spawn's two attribute objects, freed with their owner.
+struct SpawnSettings {
+  posix_spawn_file_actions_t actions;
+  posix_spawnattr_t attributes;
+  SpawnSettings() {
+    posix_spawn_file_actions_init(&actions);
+    posix_spawnattr_init(&attributes);
+  }
+  SpawnSettings(const SpawnSettings&) = delete;
+  SpawnSettings& operator=(const SpawnSettings&) = delete;
+  ~SpawnSettings() {
+    posix_spawn_file_actions_destroy(&actions);
+    posix_spawnattr_destroy(&attributes);
+  }
+  void Detach() {
+    posix_spawn_file_actions_addopen(&actions, STDIN_FILENO, "/dev/null", O_RDONLY, 0);
+    posix_spawn_file_actions_addopen(&actions, STDOUT_FILENO, "/dev/null", O_WRONLY, 0);
+    posix_spawnattr_setflags(&attributes, POSIX_SPAWN_SETSID);
+  }
+};
+
+}  // namespace
+
+std::vector<std::string> ProgramFor(const std::string& file) {
+  std::string opener = FindProgram("xdg-open");  // asks the desktop for the file type's own program
+  if (opener.empty()) return {};
+  return {std::move(opener), AbsolutePath(file)};  // absolute: a name may begin with "-" or read like an address
+}
+
+bool RunProgram(const std::vector<std::string>& arguments, bool wait) {
+  if (arguments.empty() || FaultDue()) return false;
+  const std::string program = FindProgram(arguments[0]);
+  if (program.empty()) return false;
+  std::vector<char*> vector;
+  for (const std::string& argument : arguments) vector.push_back(const_cast<char*>(argument.c_str()));
+  vector.push_back(nullptr);
+  SpawnSettings settings;
+  if (!wait) settings.Detach();
+  pid_t child;
+  if (posix_spawn(&child, program.c_str(), &settings.actions, &settings.attributes, vector.data(), environ) != 0) return false;
+  if (wait) {
+    WaitFor(child);
+    return true;
+  }
+  try {
+    std::thread(WaitFor, child).detach();  // so that it does not stay a zombie
+  } catch (const std::system_error&) {
+  }
+  return true;
+}
+
+bool IsTerminal(int stream) { return isatty(stream) == 1; }
+
+int TerminalWidth() {
+  for (const int stream : {STDERR_FILENO, STDOUT_FILENO}) {
+    winsize size = {};
+    if (ioctl(stream, TIOCGWINSZ, &size) == 0 && size.ws_col > 0) return size.ws_col;
+  }
+  const char* columns = std::getenv("COLUMNS");
+  const long width = columns != nullptr ? std::strtol(columns, nullptr, 10) : 0;
+  return width > 0 && width <= 10000 ? static_cast<int>(width) : 80;
+}
+
+unsigned CoreCount() {
+  cpu_set_t cores;
+  if (sched_getaffinity(0, sizeof cores, &cores) == 0 && CPU_COUNT(&cores) > 0) return static_cast<unsigned>(CPU_COUNT(&cores));
+  const unsigned count = std::thread::hardware_concurrency();
+  return count > 0 ? count : 1;
+}
+
+void CatchTermination() {
+  for (const int signalNumber : {SIGINT, SIGTERM}) {
+    struct sigaction old = {};
+    if (sigaction(signalNumber, nullptr, &old) != 0 || old.sa_handler == SIG_IGN) continue;
+    struct sigaction action = {};
+    action.sa_handler = OnTermination;
+    action.sa_flags = SA_RESTART;
+    sigemptyset(&action.sa_mask);
+    sigaction(signalNumber, &action, nullptr);
+  }
+}
+
+int PendingExit() { return pendingExit.load(std::memory_order_relaxed); }
+
+}  // namespace fotomill::platform
