@@ -3,6 +3,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <span>
+#include <type_traits>
 #include <utility>
 
 namespace fotomill::platform {
@@ -35,6 +36,12 @@ class MemoryBlock {
   const uint8_t* Data() const { return data_; }
   std::span<uint8_t> Bytes() { return {data_, static_cast<size_t>(size_)}; }
   std::span<const uint8_t> Bytes() const { return {data_, static_cast<size_t>(size_)}; }
+  // The bytes as an array of plain numbers or structures of them.
+  template <typename T>
+  std::span<T> Items() {
+    static_assert(std::is_trivially_copyable_v<T> && std::is_trivially_destructible_v<T>);
+    return {reinterpret_cast<T*>(data_), static_cast<size_t>(size_) / sizeof(T)};
+  }
 
  private:
   uint8_t* data_ = nullptr;

@@ -1,0 +1,48 @@
+#include "processing/color_histogram.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr uint32_t kCellBits = 5;                // of each channel
+constexpr uint32_t kLowBits = 8 - kCellBits;
+constexpr uint32_t kLowMask = (1 << kLowBits) - 1;
+constexpr uint32_t kCellMask = (1 << kCellBits) - 1;
+
+}  // namespace
+
+Status ColorHistogram::Open() {
+  const uint64_t bytes = sizeof(Cell) << (3 * kCellBits);
+  return cells_.Allocate(bytes) ? Status::Ok : Status::MemoryAllocationError;
+}
+
+void ColorHistogram::AddRow(const uint8_t* bgr, int32_t width) {
+  Cell* cells = cells_.Items<Cell>().data();
+  for (int32_t x = 0; x < width; ++x, bgr += 3) {
+    const uint32_t b = bgr[0], g = bgr[1], r = bgr[2];
+    Cell& cell = cells[(r >> kLowBits) << (2 * kCellBits) | (g >> kLowBits) << kCellBits | b >> kLowBits];
+    cell.low[0] += b & kLowMask;
+    cell.low[1] += g & kLowMask;
+    cell.low[2] += r & kLowMask;
+    ++cell.count;
+  }
+}
+
+std::vector<ColorBin> ColorHistogram::Bins() {
+  std::vector<ColorBin> bins;
+  const auto cells = cells_.Items<Cell>();
+  for (uint32_t i = 0; i < cells.size(); ++i) {
+    const Cell& cell = cells[i];
+    if (cell.count == 0) continue;
+    ColorBin bin;
+    for (uint32_t c = 0; c < 3; ++c) {
+      const uint32_t base = (i >> (kCellBits * c) & kCellMask) << kLowBits;
+      bin.channel[c] = static_cast<float>(base + static_cast<double>(cell.low[c]) / cell.count);
+    }
+    bin.weight = static_cast<float>(cell.count);
+    bins.push_back(bin);
+  }
+  return bins;
+}
+
+}  // namespace fotomill

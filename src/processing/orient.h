@@ -1,0 +1,31 @@
+#pragma once
+
+#include <cstdint>
+
+#include "core/status.h"
+#include "picture/picture_record.h"
+
+namespace fotomill {
+
+// How a stored picture must be turned to stand upright: the values of EXIF's Orientation tag (0x0112), which name where
+// the stored row 0 and column 0 belong.
+enum class Orientation : int32_t {
+  Upright = 1,         // top, left
+  MirrorAcross = 2,    // top, right: left and right change places
+  HalfTurn = 3,        // bottom, right
+  MirrorDown = 4,      // bottom, left: top and bottom change places
+  Transpose = 5,       // left, top: rows become columns
+  QuarterRight = 6,    // right, top: a quarter turn clockwise
+  Transverse = 7,      // right, bottom: mirrored about the other diagonal
+  QuarterLeft = 8,     // left, bottom: a quarter turn anticlockwise
+};
+
+// Whether an orientation exchanges width and height.
+constexpr bool SwapsSides(Orientation orientation) { return orientation >= Orientation::Transpose; }
+
+// Turns image and alpha plane, of any depth, into the upright position; where sides change places, `width` and `height`
+// and the two resolutions do as well. The orientation tag of the record's EXIF block is the caller's to change. Numbers
+// outside 1 to 8 leave the picture as it is. MemoryAllocationError leaves it unchanged.
+Status OrientPicture(PictureRecord& picture, Orientation orientation);
+
+}  // namespace fotomill
