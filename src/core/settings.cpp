@@ -3,6 +3,5 @@
 namespace fotomill {
 
 constinit Settings settings;
-constinit const Settings defaultSettings;
 
 }  // namespace fotomill
