@@ -1,6 +1,9 @@
 #include "cli/commands.h"
 
+#include "cli/formats.h"
+#include "cli/info.h"
 #include "cli/match.h"
+#include "cli/verify.h"
 
 namespace fotomill::cli {
 
@@ -8,7 +11,10 @@ namespace {
 
 // clang-format off
 constexpr Command kCommands[] = {
-    {"match", "tell which format a file name selects, without opening it", Needs::Settings, SetUpMatch},
+    {"info",    "tell what files hold, without decoding them",                 Needs::Formats,  SetUpInfo},
+    {"formats", "list the formats and what this build can do with them",       Needs::Formats,  SetUpFormats},
+    {"match",   "tell which format a file name selects, without opening it",   Needs::Formats,  SetUpMatch},
+    {"verify",  "decode files in full, to find damaged ones",                  Needs::Formats,  SetUpVerify},
 };
 // clang-format on
 

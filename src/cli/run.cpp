@@ -9,6 +9,7 @@
 #include "cli/commands.h"
 #include "cli/help.h"
 #include "core/nearest_name.h"
+#include "platform/process.h"
 
 namespace fotomill::cli {
 
@@ -160,7 +161,8 @@ int RunCommandLine(int count, const char* const* arguments, const Io& io) {
     Print(io.err, "fotomill: The results could not be written.\n");
     if (status == kExitOk) status = kExitFailed;
   }
-  return status;
+  const int asked = platform::PendingExit();
+  return asked != 0 ? asked : status;
 }
 
 }  // namespace fotomill::cli

@@ -3,5 +3,6 @@
 namespace fotomill {
 
 constinit Settings settings;
+constinit const Settings defaultSettings;
 
 }  // namespace fotomill

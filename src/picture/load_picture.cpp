@@ -22,10 +22,18 @@ Status LoadPicture(const char* fileName, PicturePointer& picture, void* window) 
   picture.reset();
   RETURN_IF_BAD(LoadPictureInfo(fileName, made));
   made->window = window;
-  const FormatEntry& row = FormatRow(made->formatIndex);
-  if (row.read != nullptr && (row.flags & FMT_RENDERED) == 0) RETURN_IF_BAD(row.read(*made, fileName));
+  RETURN_IF_BAD(ReadPicture(*made));
   picture = std::move(made);
   return Status::Ok;
+}
+
+Status ReadPicture(PictureRecord& picture) {
+  if (picture.formatIndex == kNoFormat) return Status::UnsupportedFormat;
+  if (picture.page < 0 || picture.page >= picture.pageCount) return Status::NoImages;
+  const FormatEntry& row = FormatRow(picture.formatIndex);
+  if (row.read == nullptr || (row.flags & FMT_RENDERED) != 0) return Status::Ok;
+  const PathText fileName = picture.fileName;  // the codec may use the record's own for a working file
+  return row.read(picture, fileName.c_str());
 }
 
 Status WritePicture(PictureRecord& picture, std::string_view destination, const WriteOptions& options) {
@@ -38,10 +46,12 @@ Status WritePictureAs(PictureRecord& picture, std::string_view destination, int3
   const FormatEntry& row = FormatRow(formatIndex);
   if (picture.bitsPerPixel > static_cast<int32_t>(row.maxBits)) return Status::TooManyColors;
   if (row.write == nullptr) return Status::UnsupportedFunction;
+  if (picture.image.Empty() && picture.metafile.Empty()) return Status::EmptyImage;
+  if (destination.size() > PathText::Capacity()) return Status::InvalidDestination;
   if ((row.flags & FMT_ALPHA) == 0) RETURN_IF_BAD(FlattenAlpha(picture));
-  const PathText source = picture.fileName;
-  if (!picture.fileName.Assign(destination)) return Status::InvalidDestination;
-  picture.workName = source;
+  if (picture.bitsPerPixel > static_cast<int32_t>(row.maxBits)) return Status::TooManyColors;  // flattened palette pictures
+  picture.workName = picture.fileName;
+  picture.fileName.AssignCut(destination);
   return row.write(picture, options);
 }
 

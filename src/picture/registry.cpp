@@ -6,21 +6,30 @@
 #include "core/settings.h"
 #include "core/text.h"
 #include "formats/bmp.h"
-#include "formats/fits.h"
-#include "formats/mac.h"
 #include "formats/pcx.h"
-#include "formats/xbm.h"
 #include "platform/paths.h"
 
 namespace fotomill {
 
 namespace {
 
-// Rows whose codec this build does not have.
+// Operations of rows whose codec this build does not have.
 Status NoDetails(PictureRecord&) { return Status::UnsupportedFunction; }
 Status NoInfo(PictureRecord&, const char*, uint32_t) { return Status::UnsupportedFunction; }
 Status NoRead(PictureRecord&, const char*) { return Status::UnsupportedFunction; }
 Status NoWrite(PictureRecord&, const WriteOptions&) { return Status::UnsupportedFunction; }
+
+// Formats that nobody writes: their makers never said how, or there is no picture in them to begin with.
+Status NeverWritten(PictureRecord&, const WriteOptions&) { return Status::UnsupportedFunction; }
+
+// The fractal format: its coder was never published and is gone.
+Status FifInfo(PictureRecord&, const char*, uint32_t) { return Status::UnsupportedFormat; }
+Status FifRead(PictureRecord&, const char*) { return Status::UnsupportedFormat; }
+Status FifWrite(PictureRecord&, const WriteOptions&) { return Status::UnsupportedFormat; }
+
+// The archive rows' hooks: nothing has to be loaded for ZIP; RAR waits for its library.
+int32_t Ready() { return 1; }
+int32_t NoStartup() { return 0; }
 
 struct BuiltInRow {
   std::string_view extension;
@@ -32,6 +41,8 @@ struct BuiltInRow {
   InfoOperation info;
   ReadOperation read;
   WriteOperation write;
+  LifeOperation startup = nullptr;
+  LifeOperation shutdown = nullptr;
 };
 
 // The order is behaviour: the first row that matches a name wins, so .jpeg is read as JPE and .tiff as TIF.
@@ -44,7 +55,7 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"BMP", "(BMP) Windows bitmap", 1, 24, FMT_BITMAP | FMT_ALPHA,
      BmpDetails, BmpInfo, BmpRead, BmpWrite},
     {"CDR", "(CDR) Corel Draw Preview", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES,
-     NoDetails, NoInfo, NoRead, NoWrite},
+     NoDetails, NoInfo, NoRead, NeverWritten},
     {"CUT", "(CUT) Dr. Halo", 1, 8, FMT_BITMAP,
      nullptr, NoInfo, NoRead, NoWrite},
     {"DCX", "(DCX) DCX FAX", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES,
@@ -54,7 +65,7 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"EXE", "(EXE) Self-displaying image", 0, 24, FMT_BITMAP,
      nullptr, NoInfo, NoRead, NoWrite},
     {"FIT", "(FIT) Flexible Image Transport", 1, 24, FMT_BITMAP,
-     FitsDetails, FitsInfo, FitsRead, FitsWrite},
+     NoDetails, NoInfo, NoRead, NoWrite},
     {"GIF", "(GIF) CompuServe", 1, 8, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_PAGES | FMT_TIMED | FMT_FRAMES | FMT_LAYERED | FMT_TRANSPARENT,
      NoDetails, NoInfo, NoRead, NoWrite},
     {"HDP", "(HDP) HD Photo", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_FRAMES | FMT_LAYERED,
@@ -72,13 +83,13 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"LBM", "(LBM) Amiga", 1, 8, FMT_BITMAP,
      NoDetails, NoInfo, NoRead, NoWrite},
     {"MAC", "(MAC) MacPaint", 1, 1, FMT_BITMAP,
-     nullptr, MacInfo, MacRead, MacWrite},
+     nullptr, NoInfo, NoRead, NoWrite},
     {"MOV", "(MOV) QuickTime movies", 1, 24, FMT_BITMAP | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES,
      NoDetails, NoInfo, NoRead, NoWrite},
     {"MSP", "(MSP) Microsoft Paint", 1, 1, FMT_BITMAP,
      nullptr, NoInfo, NoRead, NoWrite},
     {"PCD", "(PCD) Kodak Photo-CD", 1, 24, FMT_BITMAP | FMT_MEDIA,
-     NoDetails, NoInfo, NoRead, NoWrite},
+     NoDetails, NoInfo, NoRead, NeverWritten},
     {"PCX", "(PCX) PC Paintbrush", 1, 24, FMT_BITMAP,
      nullptr, PcxInfo, PcxRead, PcxWrite},
     {"PDD", "(PDD) Adobe Photoshop 2.5", 1, 24, FMT_BITMAP,
@@ -106,7 +117,7 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"TXT", "(TXT) Text files", 1, 24, FMT_BITMAP,
      nullptr, NoInfo, NoRead, NoWrite},
     {"WAV", "(WAV) Windows WAV", 1, 24, FMT_BITMAP | FMT_SOUND | FMT_MEDIA,
-     nullptr, NoInfo, NoRead, NoWrite},
+     nullptr, NoInfo, NoRead, NeverWritten},
     {"WBMP", "(WBMP) WAP bitmap", 1, 1, FMT_BITMAP,
      nullptr, NoInfo, NoRead, NoWrite},
     {"WEBP", "(WEBP) Google WebP", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES | FMT_LAYERED | FMT_TRANSPARENT | FMT_ALPHA,
@@ -114,7 +125,7 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"WPG", "(WPG) WordPerfect Graphics", 1, 8, FMT_BITMAP,
      nullptr, NoInfo, NoRead, NoWrite},
     {"XBM", "(XBM) XWindows bitmap", 1, 1, FMT_BITMAP,
-     nullptr, XbmInfo, XbmRead, XbmWrite},
+     nullptr, NoInfo, NoRead, NoWrite},
     {"Clpbrd", "Windows Clipboard", 1, 24, FMT_BITMAP | FMT_RENDERED | FMT_CLIPBOARD,
      nullptr, NoInfo, NoRead, NoWrite},
     {"Wllppr", "(BMP) Windows wallpaper", 1, 24, FMT_BITMAP | FMT_WALLPAPER | FMT_NO_OPEN,
@@ -126,21 +137,21 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"CALS", "(CAL) CALS", 1, 1, FMT_BITMAP | FMT_SECONDARY,
      nullptr, NoInfo, NoRead, NoWrite},
     {"CAM", "(CAM) Casio Digital Camera", 1, 24, FMT_BITMAP | FMT_SECONDARY,
-     nullptr, NoInfo, NoRead, NoWrite},
+     nullptr, NoInfo, NoRead, NeverWritten},
     {"EMF", "(EMF) Enhanced Metafile", 1, 24, FMT_RENDERED | FMT_SECONDARY,
      nullptr, NoInfo, NoRead, NoWrite},
     {"EPS", "(EPS) EPS Preview", 0, 24, FMT_SECONDARY,
      nullptr, NoInfo, NoRead, NoWrite},
     {"FIF", "(FIF) Fractal Image", 1, 24, FMT_BITMAP | FMT_SECONDARY,
-     nullptr, NoInfo, NoRead, NoWrite},
+     nullptr, FifInfo, FifRead, FifWrite},
     {"FLI", "(FLI) FLIC animation", 1, 8, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES | FMT_SECONDARY,
      nullptr, NoInfo, NoRead, NoWrite},
     {"FLC", "(FLC) FLIC animation", 1, 8, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES | FMT_SECONDARY,
      nullptr, NoInfo, NoRead, NoWrite},
     {"FPX", "(FPX) FlashPix", 1, 24, FMT_BITMAP | FMT_SECONDARY,
-     nullptr, NoInfo, NoRead, NoWrite},
+     nullptr, NoInfo, NoRead, NeverWritten},
     {"FTS", "(FTS) Flex. Image Transport", 1, 24, FMT_BITMAP | FMT_SECONDARY,
-     FitsDetails, FitsInfo, FitsRead, FitsWrite},
+     NoDetails, NoInfo, NoRead, NoWrite},
     {"CUR", "(CUR) Windows cursor", 1, 24, FMT_BITMAP | FMT_SECONDARY | FMT_ALPHA,
      nullptr, NoInfo, NoRead, NoWrite},
     {"HAM", "(HAM) Amiga", 1, 24, FMT_BITMAP | FMT_SECONDARY,
@@ -154,17 +165,17 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"JPEG", "(JPEG) Jpeg", 1, 24, FMT_BITMAP | FMT_SECONDARY,
      nullptr, NoInfo, NoRead, NoWrite},
     {"KDC", "(KDC) Kodak Digital Camera", 1, 24, FMT_BITMAP | FMT_SECONDARY,
-     nullptr, NoInfo, NoRead, NoWrite},
+     nullptr, NoInfo, NoRead, NeverWritten},
     {"PCT", "(PCT) Macintosh PICT", 1, 24, FMT_BITMAP | FMT_SECONDARY,
      nullptr, NoInfo, NoRead, NoWrite},
     {"KQP", "(KQP) Konica Quality Photos", 1, 24, FMT_BITMAP | FMT_SECONDARY,
-     nullptr, NoInfo, NoRead, NoWrite},
+     nullptr, NoInfo, NoRead, NeverWritten},
     {"PSP", "(PSP) PSP", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_SECONDARY,
      nullptr, NoInfo, NoRead, NoWrite},
     {"MID", "(MID) MIDI music", 1, 24, FMT_BITMAP | FMT_SECONDARY | FMT_MEDIA | FMT_MIDI,
-     nullptr, NoInfo, NoRead, NoWrite},
+     nullptr, NoInfo, NoRead, NeverWritten},
     {"MP3", "(MP3) MP3 compressed music", 1, 24, FMT_BITMAP | FMT_TIMED | FMT_SECONDARY | FMT_MEDIA,
-     nullptr, NoInfo, NoRead, NoWrite},
+     nullptr, NoInfo, NoRead, NeverWritten},
     {"MP4", "(MP4) MPEG-4 video", 1, 24, FMT_BITMAP | FMT_ANIMATED | FMT_TIMED | FMT_SECONDARY | FMT_MEDIA,
      nullptr, NoInfo, NoRead, NoWrite},
     {"MPEG", "(MPEG) MPEG-4 video", 1, 24, FMT_BITMAP | FMT_ANIMATED | FMT_TIMED | FMT_SECONDARY | FMT_MEDIA,
@@ -176,9 +187,9 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"RGB", "(RGB) Silicon Graphics", 1, 24, FMT_BITMAP | FMT_SECONDARY | FMT_ALPHA,
      nullptr, NoInfo, NoRead, NoWrite},
     {"TTF", "(TTF) TrueType Font", 1, 24, FMT_BITMAP | FMT_SECONDARY,
-     NoDetails, NoInfo, NoRead, NoWrite},
+     NoDetails, NoInfo, NoRead, NeverWritten},
     {"OTF", "(OTF) OpenType Font", 1, 24, FMT_BITMAP | FMT_SECONDARY,
-     NoDetails, NoInfo, NoRead, NoWrite},
+     NoDetails, NoInfo, NoRead, NeverWritten},
     {"UUE", "(UUE) UUEncoded graphics", 1, 24, FMT_BITMAP | FMT_SECONDARY,
      nullptr, NoInfo, NoRead, NoWrite},
     {"WDP", "(WDP) HD Photo", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_FRAMES | FMT_LAYERED | FMT_SECONDARY,
@@ -188,9 +199,9 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"WMV", "(WMV) WMV video", 1, 24, FMT_BITMAP | FMT_ANIMATED | FMT_TIMED | FMT_SECONDARY | FMT_MEDIA,
      nullptr, NoInfo, NoRead, NoWrite},
     {"RAR", "(RAR) RAR archive", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_CONTAINER | FMT_LAYERED | FMT_SECONDARY | FMT_ARCHIVE,
-     nullptr, NoInfo, NoRead, NoWrite},
+     nullptr, NoInfo, NoRead, NeverWritten, NoStartup, NoStartup},
     {"ZIP", "(ZIP) ZIP archive", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_CONTAINER | FMT_LAYERED | FMT_SECONDARY | FMT_ARCHIVE,
-     nullptr, NoInfo, NoRead, NoWrite},
+     nullptr, NoInfo, NoRead, NoWrite, Ready, Ready},
     {"", "", 0, 0, FMT_SPARE,
      nullptr, nullptr, nullptr, nullptr},
 };
@@ -206,6 +217,8 @@ constexpr std::array<FormatEntry, formatCount> MakeRows() {
                .info = facts.info,
                .read = facts.read,
                .write = facts.write,
+               .startup = facts.startup,
+               .shutdown = facts.shutdown,
                .maxBits = facts.maxBits,
                .extension = facts.extension,
                .description = facts.description,
@@ -246,9 +259,27 @@ int32_t FindPluginFormat(std::string_view fileName, int32_t parameter) {
   return pluginFallback == nullptr ? kNoFormat : pluginFallback(fileName, parameter);
 }
 
-bool CanRead(const FormatEntry& row) { return row.read != nullptr && row.read != NoRead; }
+bool CanRead(const FormatEntry& row) {
+  if (row.info == nullptr || row.info == NoInfo || row.info == FifInfo) return false;
+  return (row.flags & FMT_RENDERED) != 0 || (row.read != nullptr && row.read != NoRead);
+}
 
-bool CanWrite(const FormatEntry& row) { return row.write != nullptr && row.write != NoWrite; }
+bool CanWrite(const FormatEntry& row) {
+  return row.write != nullptr && row.write != NoWrite && row.write != NeverWritten && row.write != FifWrite;
+}
+
+bool CanTellDetails(const FormatEntry& row) { return row.details != nullptr && row.details != NoDetails; }
+
+bool CanStartUp(const FormatEntry& row) { return row.startup != nullptr && row.startup != NoStartup; }
+
+std::string_view WhyNot(const FormatEntry& row) {
+  if (row.info == FifInfo) return "The format was never published.";
+  if ((row.flags & FMT_SPARE) != 0) return "No plug-in uses this row.";
+  if (!CanRead(row)) return "This build has no codec for the format.";
+  if (row.write == NeverWritten) return "Files of this format can only be read.";
+  if (!CanWrite(row)) return "This build cannot write the format.";
+  return {};
+}
 
 void RunFormatStartup() {
   for (const FormatEntry& row : formatRows) {
@@ -296,6 +327,15 @@ std::vector<int32_t> FormatListRows() {
   std::vector<int32_t> rows;
   for (int32_t i = 0; i < formatCount; ++i) {
     if ((FormatRow(i).flags & (FMT_CLIPBOARD | FMT_SPARE)) == 0) rows.push_back(i);
+  }
+  return rows;
+}
+
+std::vector<int32_t> ChoiceRows() {
+  std::vector<int32_t> rows;
+  for (int32_t i = 0; i < formatCount; ++i) {
+    const FormatEntry& row = FormatRow(i);
+    if (row.enabled == 1 && (row.flags & (FMT_CLIPBOARD | FMT_HIDDEN | FMT_SPARE)) == 0) rows.push_back(i);
   }
   return rows;
 }

@@ -81,9 +81,13 @@ using PluginFallback = int32_t (*)(std::string_view fileName, int32_t parameter)
 void InstallPluginFallback(PluginFallback fallback);
 int32_t FindPluginFormat(std::string_view fileName, int32_t parameter = 0);
 
-// Whether a row's operation does its work in this build, and if not, why ("" when it does).
+// Whether a row's operations do their work in this build.
 bool CanRead(const FormatEntry& row);
 bool CanWrite(const FormatEntry& row);
+bool CanTellDetails(const FormatEntry& row);
+bool CanStartUp(const FormatEntry& row);
+// Why a row cannot be read or cannot be written here, in one sentence; empty when both work.
+std::string_view WhyNot(const FormatEntry& row);
 
 // Call `startup`, or `shutdown`, of every row that has one, in row order.
 void RunFormatStartup();
@@ -92,12 +96,16 @@ void RunFormatShutdown();
 // Opens and decodes a file into a new record: finds its row, runs `info` and, for rows that are not rendered, `read`.
 // UnsupportedFormat (8) when no row matches, else the codec's own status; `picture` is null unless Ok.
 Status LoadPicture(const char* fileName, PicturePointer& picture, void* window = nullptr);
-// The first half of it: a record with the facts of a file. `flags` are handed to `info`.
+// The first half of it: a record with the facts of a file. `flags` are handed to `info`. FileOpenError (1) for a path over
+// 260 characters.
 Status LoadPictureInfo(const char* fileName, PicturePointer& picture, uint32_t flags = 0);
+// The second half: decodes the page `picture.page` of the file that the record has the facts of. NoImages (20) when the
+// file has no such page, else the codec's own status; `image` and `alpha` are empty unless Ok.
+Status ReadPicture(PictureRecord& picture);
 
 // Writes a picture to `destination` in the format of its extension. UnsupportedFormat (8) when no row matches,
 // TooManyColors (12) when the picture is deeper than the row takes, UnsupportedFunction (5) when the row cannot write,
-// InvalidDestination (29) for a path over 260 characters, else the codec's own status. Alpha that the format cannot hold
+// EmptyImage (31) for a record without a picture, InvalidDestination (29) for a path over 260 characters, else the codec's own status. Alpha that the format cannot hold
 // is flattened first. The picture stays the caller's.
 Status WritePicture(PictureRecord& picture, std::string_view destination, const WriteOptions& options);
 // The same to a given row.
@@ -118,7 +126,9 @@ std::vector<FilterPair> OpenFileFilter();
 std::vector<int32_t> DestinationRows();
 // The rows of the format list, in which the user switches formats on and off: indices.
 std::vector<int32_t> FormatListRows();
-// A line of that list: a multiplication sign (U+00D7) or a blank, a tab, the description.
+// The rows of other lists to choose a format from, shown by their descriptions: those switched on.
+std::vector<int32_t> ChoiceRows();
+// A line of the format list: a multiplication sign (U+00D7) or a blank, a tab, the description.
 std::string FormatListLine(int32_t index);
 
 }  // namespace fotomill

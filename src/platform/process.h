@@ -18,7 +18,8 @@ unsigned CoreCount();         // cores this process may use, at least 1
 
 // From here on Ctrl-C and the system's request to end are remembered instead of ending the program at once, and
 // `PendingExit` returns the exit status that belongs to them: 130 or 143, 0 while nothing was asked. A second request ends
-// the program at once. A request that was ignored when the program started (nohup) stays ignored.
+// the program at once; temporary files go all the same. A request that was ignored when the program started (nohup) stays
+// ignored. Writing to a pipe that nobody reads any more fails from here on, instead of ending the program.
 void CatchTermination();
 int PendingExit();
 

@@ -14,7 +14,7 @@ class SharedLibrary {
 
   // Loads a module by its absolute path; anything but a regular file is refused. False with `Error()` set.
   [[nodiscard]] bool Load(const std::string& absolutePath);
-  // Loads one of the system's own libraries by its bare name ("libjxr.so.0").
+  // Loads one of the system's own libraries by its bare name ("libjxr.so.0"), wherever the system keeps them.
   [[nodiscard]] bool LoadSystem(const std::string& name);
   bool Loaded() const { return handle_ != nullptr; }
   // An export's address, null when it has none of that name.

@@ -16,7 +16,8 @@ class StoreFile {
 
   enum class Mode { Read, ReadWrite, CreateNew };  // CreateNew fails when the name is taken
   enum class OpenResult { Done, Missing, Exists, Failed };
-  // Opens a regular file; links are followed for reading only.
+  // Opens a regular file; links are followed for reading only. A link that leads nowhere is Failed, not Missing: who makes
+  // a new store where one merely could not be opened loses the old one.
   OpenResult Open(const std::string& path, Mode mode);
   void Close();
   bool IsOpen() const { return handle_ != -1; }
@@ -27,7 +28,8 @@ class StoreFile {
   [[nodiscard]] bool ReadAt(uint64_t offset, std::span<uint8_t> bytes) const;
   [[nodiscard]] bool WriteAt(uint64_t offset, std::span<const uint8_t> bytes);
   [[nodiscard]] bool Sync();
-  // Waits for the exclusive lock on the file. Advisory between programs that ask for it.
+  // Waits for the exclusive lock on the file, which two StoreFiles never hold together, in one process or in two. Advisory
+  // between programs that ask for it. False when it cannot be had, or when the program was asked to end meanwhile.
   [[nodiscard]] bool Lock();
   void Unlock();
   // Whether `path` still names this very file; after waiting for a lock another process may have replaced it.

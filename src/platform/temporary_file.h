@@ -1,14 +1,15 @@
 #pragma once
 
-#include <span>
 #include <cstdint>
+#include <span>
 #include <string>
 #include <string_view>
 
 namespace fotomill::platform {
 
-// A working file that is deleted with its owner: a unique name with the prefix "FMWT" in the temporary folder, or, when
-// none can be had there, "TEMP$$$.$$$" in the working folder. Always created exclusively.
+// A working file that is deleted with its owner, and that only its user may read: a unique name with the prefix "FMWT" in
+// the temporary folder, or, when none of at most 260 characters can be had there, "TEMP$$$.$$$" in the working folder.
+// Always created exclusively; a link of that name is never followed.
 class TemporaryFile {
  public:
   TemporaryFile() = default;
@@ -17,15 +18,16 @@ class TemporaryFile {
   ~TemporaryFile() { Delete(); }
 
   // Creates the empty file, its name ending in `extension` (with dot, ".tmp" by default; the fall-back name is then
-  // "TEMP$$$" with that extension). False when neither name can be had.
+  // "TEMP$$$" with that extension). False when neither name can be had; a file that was held before is gone then too.
   [[nodiscard]] bool Create(std::string_view extension = {});
-  // Fills it. False when not all could be written.
+  // Makes `bytes` the whole contents. False when not all could be written.
   [[nodiscard]] bool Write(std::span<const uint8_t> bytes);
   const std::string& Path() const { return path_; }
   void Delete();
 
  private:
   std::string path_;
+  int listed_ = -1;  // its number among the names that go when the program is ended at once
 };
 
 }  // namespace fotomill::platform

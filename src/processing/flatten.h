@@ -5,9 +5,10 @@
 
 namespace fotomill {
 
-// Composites a 24-bit picture that has an alpha plane onto its background colour (the record's own when it says so, else
-// its `defaultColour`), in place, and frees the plane. Per channel (background x (255 - a) + pixel x a) / 255, rounded to
-// nearest. A picture without a plane is left as it is. Always Ok.
+// Composites a picture whose alpha plane is marked as present (kHasAlpha) onto its background colour (the record's own
+// when it says so, else its `defaultColour`), in place, and frees the plane. Per channel (background x (255 - a) +
+// pixel x a) / 255, rounded to nearest. A palette picture becomes one of 24 bits first, unless it is opaque throughout.
+// A picture without such a plane is left as it is. MemoryAllocationError leaves the picture unchanged.
 Status FlattenAlpha(PictureRecord& picture);
 
 }  // namespace fotomill

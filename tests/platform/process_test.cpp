@@ -2,7 +2,6 @@
 
 #include <gtest/gtest.h>
 #include <signal.h>
-#include <sys/wait.h>
 #include <unistd.h>
 
 #include <chrono>
@@ -10,12 +9,14 @@
 
 #include "platform/clock.h"
 #include "platform/files.h"
+#include "support/child.h"
 #include "support/files.h"
 #include "support/scoped_environment.h"
 
 namespace fotomill::platform {
 namespace {
 
+using test::InChild;
 using test::ReadText;
 using test::ScopedEnvironment;
 using test::TemporaryFolder;
@@ -77,19 +78,6 @@ TEST(Process, WhatIsNoProgramDoesNotStart) {
   WriteText(folder.Path("xdg-open"), "#!/bin/sh\n");
   std::filesystem::permissions(folder.Path("xdg-open"), std::filesystem::perms::owner_all);
   EXPECT_EQ(ProgramFor("/-a\n.bmp"), (std::vector<std::string>{folder.Path("xdg-open"), "/-a\n.bmp"}));
-}
-
-// Runs `body` in a child and returns its wait status.
-template <typename Body>
-int InChild(Body body) {
-  const pid_t child = fork();
-  if (child == 0) {
-    body();
-    _exit(0);
-  }
-  int status = -1;
-  waitpid(child, &status, 0);
-  return status;
 }
 
 TEST(Process, TheFirstRequestToEndIsRememberedTheSecondEnds) {

@@ -20,6 +20,7 @@
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
+#include "platform/posix/temporary_names.h"
 
 extern char** environ;
 
@@ -33,6 +34,7 @@ static_assert(std::atomic<int>::is_always_lock_free, "the handler may only touch
 void OnTermination(int signalNumber) {
   int none = 0;
   if (pendingExit.compare_exchange_strong(none, 128 + signalNumber)) return;
+  DeleteListedTemporaries();
   signal(signalNumber, SIG_DFL);
   raise(signalNumber);  // delivered when this handler returns
 }
@@ -141,6 +143,7 @@ void CatchTermination() {
     sigemptyset(&action.sa_mask);
     sigaction(signalNumber, &action, nullptr);
   }
+  signal(SIGPIPE, SIG_IGN);
 }
 
 int PendingExit() { return pendingExit.load(std::memory_order_relaxed); }

@@ -1,0 +1,128 @@
+#include "cli/info.h"
+
+#include <CLI/CLI.hpp>
+#include <memory>
+#include <string>
+
+#include "cli/file_selection.h"
+#include "cli/picture_failure.h"
+#include "cli/result_output.h"
+#include "cli/shown_text.h"
+#include "core/text.h"
+#include "picture/registry.h"
+
+namespace fotomill::cli {
+
+namespace {
+
+struct InfoOptions {
+  SelectionOptions selection;
+  bool json = false;
+};
+
+std::string Resolution(double pixelsPerInch) {
+  char text[32];
+  std::snprintf(text, sizeof text, "%g", pixelsPerInch);
+  return text;
+}
+
+Json FactsAsJson(const PictureRecord& picture) {
+  const FormatEntry& row = FormatRow(picture.formatIndex);
+  Json facts;
+  facts["format"] = row.extension.view();
+  facts["index"] = picture.formatIndex;
+  facts["description"] = row.description.view();
+  facts["typeName"] = picture.typeName.view();
+  facts["width"] = picture.width;
+  facts["height"] = picture.height;
+  facts["bitsPerPixel"] = picture.bitsPerPixel;
+  facts["alpha"] = (picture.alphaFlags & kHasAlpha) != 0;
+  facts["fileSize"] = picture.fileSize;
+  facts["imageBytes"] = picture.imageBytes;
+  facts["details"] = Json::array();
+  for (size_t i = 0; i < picture.detailLines.Count(); ++i) facts["details"].push_back(picture.detailLines.Line(i));
+  facts["pages"] = picture.pageCount;
+  if (picture.metadata.dpiX > 0) facts["dpiX"] = picture.metadata.dpiX;
+  if (picture.metadata.dpiY > 0) facts["dpiY"] = picture.metadata.dpiY;
+  return facts;
+}
+
+void PrintFact(ResultOutput& output, const char* label, const std::string& value) {
+  std::string line = std::string("  ") + label;
+  output.Line(line.append(16 - line.size(), ' ') + EscapeControls(value));
+}
+
+void PrintFacts(ResultOutput& output, const std::string& name, const PictureRecord& picture) {
+  output.Line(output.Shown(name));
+  PrintFact(output, "Format", std::string(FormatRow(picture.formatIndex).description.view()));
+  if (!picture.typeName.empty()) PrintFact(output, "Type", std::string(picture.typeName.view()));
+  PrintFact(output, "Dimensions", std::to_string(picture.width) + " x " + std::to_string(picture.height) + " pixels");
+  std::string depth = std::to_string(picture.bitsPerPixel) + (picture.bitsPerPixel == 1 ? " bit" : " bits");
+  if ((picture.alphaFlags & kHasAlpha) != 0) depth += " and alpha";
+  PrintFact(output, "Depth", depth);
+  if (picture.pageCount > 1) PrintFact(output, "Pages", std::to_string(picture.pageCount));
+  if (picture.metadata.dpiX > 0 && picture.metadata.dpiY > 0) {
+    PrintFact(output, "Resolution",
+              Resolution(picture.metadata.dpiX) + " x " + Resolution(picture.metadata.dpiY) + " pixels per inch");
+  }
+  PrintFact(output, "File size", WithThousands(picture.fileSize) + " bytes");
+  PrintFact(output, "Image data", WithThousands(picture.imageBytes) + " bytes");
+  for (size_t i = 0; i < picture.detailLines.Count(); ++i) {
+    output.Line("  " + EscapeControls(picture.detailLines.Line(i)));
+  }
+}
+
+Status GatherFacts(const SelectedFile& file, PicturePointer& picture) {
+  if (file.status != Status::Ok) return file.status;
+  RETURN_IF_BAD(LoadPictureInfo(file.name.c_str(), picture));
+  const FormatEntry& row = FormatRow(picture->formatIndex);
+  if (CanTellDetails(row)) RETURN_IF_BAD(row.details(*picture));
+  return Status::Ok;
+}
+
+void ReportFile(const SelectedFile& file, ResultOutput& output) {
+  PicturePointer picture;
+  const Status status = GatherFacts(file, picture);
+  const std::string hint = status == Status::Ok || !file.hint.empty() ? file.hint : OpenHint(file.name, status);
+  if (output.IsJson()) {
+    Json element;
+    PutName(element, "file", file.name);
+    PutStatus(element, status);
+    if (status == Status::Ok) {
+      element.update(FactsAsJson(*picture));
+    } else if (file.status == Status::Ok) {
+      const std::string_view looksLike = LooksLike(file.name, FindFormatByName(file.name));
+      if (!looksLike.empty()) element["looksLike"] = looksLike;
+    }
+    output.Element(element);
+  }
+  if (status != Status::Ok) {
+    output.Failure(file.name, status, hint);
+    return;
+  }
+  output.CountFile();
+  if (!output.IsJson()) PrintFacts(output, file.name, *picture);
+}
+
+int RunInfo(const InfoOptions& options, const CommandContext& context) {
+  const auto files = SelectFiles(options.selection, context);
+  if (!files) return kExitUsage;
+  ResultOutput output(context, options.json);
+  for (const SelectedFile& file : *files) {
+    if (!output.GoesOn()) break;
+    ReportFile(file, output);
+  }
+  return output.Finish();
+}
+
+}  // namespace
+
+void SetUpInfo(CLI::App& app, CommandContext& context) {
+  auto options = std::make_shared<InfoOptions>();
+  AddSelection(app, options->selection, context);
+  app.add_flag("--json", options->json, "One JSON array, an object for each file");
+  app.footer("Example: fotomill info holiday --recursive --json");
+  context.run = [options, &context] { return RunInfo(*options, context); };
+}
+
+}  // namespace fotomill::cli

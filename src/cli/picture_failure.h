@@ -1,0 +1,17 @@
+#pragma once
+
+#include <string>
+#include <string_view>
+
+#include "core/status.h"
+
+namespace fotomill::cli {
+
+// What a file looks like by its first bytes ("AVIF"), where that is not what its name says; empty otherwise.
+std::string_view LooksLike(const std::string& fileName, int32_t formatIndex);
+
+// What goes behind the message of a file that could not be opened or decoded: what it looks like, what the build lacks,
+// or which format its name should have selected. Empty when there is nothing to add.
+std::string OpenHint(const std::string& fileName, Status status);
+
+}  // namespace fotomill::cli

@@ -1,0 +1,125 @@
+#include "cli/result_output.h"
+
+#include "cli/shown_text.h"
+#include "platform/process.h"
+
+namespace fotomill::cli {
+
+namespace {
+
+constexpr std::string_view kRed = "\x1b[31m", kPlain = "\x1b[0m";
+
+void Write(std::FILE* stream, std::string_view text) {
+  std::fwrite(text.data(), 1, text.size(), stream);
+}
+
+// JSON text in which control characters beyond ASCII, which JSON lets stand, are escaped too: it may go to a terminal.
+std::string SafeJson(const Json& value) {
+  const std::string text = value.dump(-1, ' ', false, Json::error_handler_t::replace);
+  std::string result;
+  result.reserve(text.size());
+  for (size_t i = 0; i < text.size(); ++i) {
+    const auto byte = static_cast<uint8_t>(text[i]);
+    const auto next = static_cast<uint8_t>(i + 1 < text.size() ? text[i + 1] : 0);
+    char escaped[8];
+    if (byte == 0x7F) {
+      result += "\\u007f";
+    } else if (byte == 0xC2 && next < 0xA0) {
+      std::snprintf(escaped, sizeof escaped, "\\u00%02x", next);
+      result += escaped;
+      ++i;
+    } else {
+      result += text[i];
+    }
+  }
+  return result;
+}
+
+}  // namespace
+
+void PutName(Json& object, const std::string& key, std::string_view name) {
+  object[key] = name;
+  if (!IsUtf8(name)) object[key + "Bytes"] = Base64(name);
+}
+
+void PutStatus(Json& object, Status status) {
+  object["status"] = StatusNumber(status);
+  object["message"] = StatusMessage(status);
+}
+
+ResultOutput::ResultOutput(const CommandContext& context, bool json)
+    : context_(context), json_(json), colored_(context.ColorOn(context.io.errTerminal)) {
+  if (json_) Write(context_.io.out, "[");
+}
+
+ResultOutput::~ResultOutput() {
+  EndArray();
+}
+
+std::string ResultOutput::Shown(std::string_view name) const {
+  return context_.io.outTerminal ? EscapeControls(name) : std::string(name);
+}
+
+void ResultOutput::Line(std::string_view line) {
+  Write(context_.io.out, line);
+  Write(context_.io.out, "\n");
+  std::fflush(context_.io.out);
+}
+
+void ResultOutput::Element(const Json& element) {
+  Write(context_.io.out, begun_ ? ",\n" : "\n");
+  Write(context_.io.out, SafeJson(element));
+  std::fflush(context_.io.out);
+  begun_ = true;
+}
+
+void ResultOutput::Failure(std::string_view name, Status status, std::string_view hint) {
+  ++files_;
+  ++failures_;
+  std::string text = context_.io.errTerminal ? EscapeControls(name) : std::string(name);
+  text += ": ";
+  if (colored_) text += kRed;
+  text += StatusMessage(status);
+  if (colored_) text += kPlain;
+  if (!hint.empty()) text.append(" ").append(hint);
+  PrintMessage(text);
+}
+
+void ResultOutput::Note(std::string_view text) {
+  if (!context_.global.quiet) PrintMessage(text);
+}
+
+bool ResultOutput::GoesOn() const {
+  return std::ferror(context_.io.out) == 0 && platform::PendingExit() == 0;
+}
+
+int ResultOutput::Finish() {
+  EndArray();
+  if (!context_.global.quiet) {
+    if (failures_ > 0) PrintMessage("There were errors");
+    if (files_ == 1) {
+      PrintMessage("One file was processed.");
+    } else {
+      PrintMessage(files_ == 0 ? "No files were processed." : std::to_string(files_) + " files were processed.");
+    }
+  }
+  return failures_ > 0 ? kExitFailed : kExitOk;
+}
+
+void ResultOutput::EndArray() {
+  if (json_ && !ended_) {
+    Write(context_.io.out, "\n]\n");
+    std::fflush(context_.io.out);
+  }
+  ended_ = true;
+}
+
+// Results that came before are on their way first, so that the two streams keep their order where they meet.
+void ResultOutput::PrintMessage(std::string_view text) {
+  std::string line(text);
+  line += "\n";
+  Write(context_.io.err, line);
+  std::fflush(context_.io.err);
+}
+
+}  // namespace fotomill::cli

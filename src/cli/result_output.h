@@ -1,0 +1,66 @@
+#pragma once
+
+#include <cstdint>
+#include <nlohmann/json.hpp>
+#include <string>
+#include <string_view>
+
+#include "cli/command.h"
+#include "core/status.h"
+
+namespace fotomill::cli {
+
+using Json = nlohmann::ordered_json;
+
+// Sets `key` to a name. One that is not UTF-8 also sets `key` + "Bytes", its bytes in base64; `key` then has U+FFFD in
+// the places that are none.
+void PutName(Json& object, const std::string& key, std::string_view name);
+// Sets `status` and `message`.
+void PutStatus(Json& object, Status status);
+
+// The output of one command over many things, in the order in which they happen: results on the standard output, as
+// lines or as one JSON array with an element a line, and messages on the standard error. Nothing is held back.
+class ResultOutput {
+ public:
+  ResultOutput(const CommandContext& context, bool json);
+  ResultOutput(const ResultOutput&) = delete;
+  ResultOutput& operator=(const ResultOutput&) = delete;
+  ~ResultOutput();  // ends the array, whatever happened
+
+  bool IsJson() const { return json_; }
+  // A name as a line shows it: escaped on a terminal, byte for byte elsewhere.
+  std::string Shown(std::string_view name) const;
+
+  // One result line, without its end; the caller has escaped what needs it. Not for JSON.
+  void Line(std::string_view line);
+  // One element of the array. Only for JSON.
+  void Element(const Json& element);
+  // Counts a thing that was dealt with: the closing line tells how many there were.
+  void CountFile() { ++files_; }
+  // The message of a file that failed, "NAME: MESSAGE", with a hint behind it where there is one. Counts it as well.
+  void Failure(std::string_view name, Status status, std::string_view hint = {});
+  // A remark on the standard error that is no failure; left out by --quiet.
+  void Note(std::string_view text);
+
+  // False once the standard output takes nothing more, or the user has asked the program to end: loops over files end
+  // then.
+  bool GoesOn() const;
+  bool Failed() const { return failures_ > 0; }
+  // Ends the array, prints the closing lines ("There were errors", "3 files were processed.") and returns the exit
+  // status.
+  int Finish();
+
+ private:
+  void EndArray();
+  void PrintMessage(std::string_view text);
+
+  const CommandContext& context_;
+  const bool json_;
+  bool colored_;
+  bool begun_ = false;  // the array has an element
+  bool ended_ = false;
+  uint64_t files_ = 0;
+  uint64_t failures_ = 0;
+};
+
+}  // namespace fotomill::cli

@@ -1,0 +1,67 @@
+#include "cli/verify.h"
+
+#include <CLI/CLI.hpp>
+#include <memory>
+#include <string>
+
+#include "cli/file_selection.h"
+#include "cli/picture_failure.h"
+#include "cli/result_output.h"
+#include "picture/registry.h"
+
+namespace fotomill::cli {
+
+namespace {
+
+struct VerifyOptions {
+  SelectionOptions selection;
+  bool json = false;
+};
+
+// Decodes every page of a file.
+Status VerifyFile(const std::string& name) {
+  int32_t pages = 1;
+  for (int32_t page = 0; page < pages; ++page) {
+    PicturePointer picture;
+    RETURN_IF_BAD(LoadPictureInfo(name.c_str(), picture));
+    picture->page = page;
+    pages = picture->pageCount;
+    RETURN_IF_BAD(ReadPicture(*picture));
+  }
+  return Status::Ok;
+}
+
+int RunVerify(const VerifyOptions& options, const CommandContext& context) {
+  const auto files = SelectFiles(options.selection, context);
+  if (!files) return kExitUsage;
+  ResultOutput output(context, options.json);
+  for (const SelectedFile& file : *files) {
+    if (!output.GoesOn()) break;
+    const Status status = file.status == Status::Ok ? VerifyFile(file.name) : file.status;
+    if (output.IsJson()) {
+      Json element;
+      PutName(element, "file", file.name);
+      PutStatus(element, status);
+      output.Element(element);
+    }
+    if (status != Status::Ok) {
+      output.Failure(file.name, status, file.hint.empty() ? OpenHint(file.name, status) : file.hint);
+      continue;
+    }
+    output.CountFile();
+    if (!output.IsJson()) output.Line(output.Shown(file.name) + ": " + std::string(StatusMessage(status)));
+  }
+  return output.Finish();
+}
+
+}  // namespace
+
+void SetUpVerify(CLI::App& app, CommandContext& context) {
+  auto options = std::make_shared<VerifyOptions>();
+  AddSelection(app, options->selection, context);
+  app.add_flag("--json", options->json, "One JSON array of {file, status, message}");
+  app.footer("Every page of every file is decoded in full; nothing is written.\n\nExample: fotomill verify -r holiday");
+  context.run = [options, &context] { return RunVerify(*options, context); };
+}
+
+}  // namespace fotomill::cli

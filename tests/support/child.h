@@ -1,0 +1,21 @@
+#pragma once
+
+#include <sys/wait.h>
+#include <unistd.h>
+
+namespace fotomill::test {
+
+// Runs `body` in a process of its own and returns its wait status; a body that returns has exit status 0.
+template <typename Body>
+int InChild(Body body) {
+  const pid_t child = fork();
+  if (child == 0) {
+    body();
+    _exit(0);
+  }
+  int status = -1;
+  waitpid(child, &status, 0);
+  return status;
+}
+
+}  // namespace fotomill::test
