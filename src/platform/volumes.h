@@ -10,17 +10,18 @@ enum class DriveKind { Unknown, Removable, Fixed, Network, Optical, Ram };
 // The volume that holds a path: its label and serial number as the system tells them.
 struct Volume {
   bool available = false;
-  std::string label;
-  uint32_t serial = 0;
+  std::string label;    // empty when it has none
+  uint32_t serial = 0;  // of FAT, exFAT and NTFS the same number on every system
   DriveKind kind = DriveKind::Unknown;
 };
 
-// Asks the system; tests put a function of their own in its place.
+// Asks the system about the volume of a file or folder that is there, or whose folder is; any other is not available. Tests
+// put a function of their own in its place.
 Volume VolumeOf(const std::string& path);
 using VolumeFunction = Volume (*)(const std::string& path);
 void ReplaceVolumeFunction(VolumeFunction function);  // null restores the system's
 
-// Free bytes on the volume of a path, 0 when unknown.
+// Free bytes on the volume of a path (likewise), 0 when unknown.
 uint64_t FreeSpace(const std::string& path);
 
 }  // namespace fotomill::platform
