@@ -21,6 +21,10 @@ constexpr bool EqualIgnoringCase(std::string_view a, std::string_view b) {
   return true;
 }
 
+// The whole number that a text begins with: white space, a sign, decimal digits; whatever follows is ignored. 0 without a
+// digit; a number beyond 64 bits gives the nearest one that fits.
+int64_t LeadingInteger(std::string_view text);
+
 // A number in decimal with a comma between every group of three digits.
 std::string WithThousands(uint64_t number);
 

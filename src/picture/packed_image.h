@@ -79,6 +79,10 @@ class PackedImage {
   uint64_t stride_ = 0;
 };
 
+// Whether a picture of that size can be held at all, without taking memory: Ok, DamagedFile when width or height is below
+// 1, MemoryAllocationError when its block would exceed the limit.
+Status CheckPackedSize(int32_t width, int32_t height, int32_t bitsPerPixel);
+
 // Makes the packed block of a picture at the normalised depth of `bitsPerPixel`, with its colour table taken from
 // `palette` (zero without one) and its rows zero; with Fill::Unset the rows hold anything, for callers that write every
 // byte of them, padding included. DamagedFile when width or height is below 1, MemoryAllocationError when the block would

@@ -22,6 +22,10 @@ using Color = uint32_t;
 inline constexpr uint8_t kHasAlpha = 1;             // the picture has alpha; set by `info` for sources deeper than 24 bits
 inline constexpr uint8_t kFlattenOnBackground = 2;  // flatten onto the record's own background
 
+// Request flag of `info`: only formats that know their files by a signature are asked. The others answer
+// UnsupportedFormat (8) without opening the file.
+inline constexpr uint32_t kInfoSignedOnly = 0x200;
+
 // Technical facts of a file for "Get info": lines of at most 36 characters.
 class DetailLines {
  public:
@@ -83,8 +87,9 @@ struct PictureRecord {
                               // twice this square; `width` and `height` keep the full size, `image` tells its own
   ProgressSink* progress = nullptr;   // not owned, may be null
 
-  void ReportRow(int32_t done) const {
-    if (progress != nullptr) progress->Step(done, height);
+  void ReportRow(int32_t done) const { ReportRow(done, height); }
+  void ReportRow(int32_t done, int32_t total) const {
+    if (progress != nullptr) progress->Step(done, total);
   }
 };
 

@@ -6,7 +6,10 @@
 #include "core/settings.h"
 #include "core/text.h"
 #include "formats/bmp.h"
+#include "formats/fits.h"
+#include "formats/mac.h"
 #include "formats/pcx.h"
+#include "formats/xbm.h"
 #include "platform/paths.h"
 
 namespace fotomill {
@@ -65,7 +68,7 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"EXE", "(EXE) Self-displaying image", 0, 24, FMT_BITMAP,
      nullptr, NoInfo, NoRead, NoWrite},
     {"FIT", "(FIT) Flexible Image Transport", 1, 24, FMT_BITMAP,
-     NoDetails, NoInfo, NoRead, NoWrite},
+     FitsDetails, FitsInfo, FitsRead, FitsWrite},
     {"GIF", "(GIF) CompuServe", 1, 8, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_PAGES | FMT_TIMED | FMT_FRAMES | FMT_LAYERED | FMT_TRANSPARENT,
      NoDetails, NoInfo, NoRead, NoWrite},
     {"HDP", "(HDP) HD Photo", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_FRAMES | FMT_LAYERED,
@@ -83,7 +86,7 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"LBM", "(LBM) Amiga", 1, 8, FMT_BITMAP,
      NoDetails, NoInfo, NoRead, NoWrite},
     {"MAC", "(MAC) MacPaint", 1, 1, FMT_BITMAP,
-     nullptr, NoInfo, NoRead, NoWrite},
+     nullptr, MacInfo, MacRead, MacWrite},
     {"MOV", "(MOV) QuickTime movies", 1, 24, FMT_BITMAP | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES,
      NoDetails, NoInfo, NoRead, NoWrite},
     {"MSP", "(MSP) Microsoft Paint", 1, 1, FMT_BITMAP,
@@ -125,7 +128,7 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"WPG", "(WPG) WordPerfect Graphics", 1, 8, FMT_BITMAP,
      nullptr, NoInfo, NoRead, NoWrite},
     {"XBM", "(XBM) XWindows bitmap", 1, 1, FMT_BITMAP,
-     nullptr, NoInfo, NoRead, NoWrite},
+     nullptr, XbmInfo, XbmRead, XbmWrite},
     {"Clpbrd", "Windows Clipboard", 1, 24, FMT_BITMAP | FMT_RENDERED | FMT_CLIPBOARD,
      nullptr, NoInfo, NoRead, NoWrite},
     {"Wllppr", "(BMP) Windows wallpaper", 1, 24, FMT_BITMAP | FMT_WALLPAPER | FMT_NO_OPEN,
@@ -151,7 +154,7 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"FPX", "(FPX) FlashPix", 1, 24, FMT_BITMAP | FMT_SECONDARY,
      nullptr, NoInfo, NoRead, NeverWritten},
     {"FTS", "(FTS) Flex. Image Transport", 1, 24, FMT_BITMAP | FMT_SECONDARY,
-     NoDetails, NoInfo, NoRead, NoWrite},
+     FitsDetails, FitsInfo, FitsRead, FitsWrite},
     {"CUR", "(CUR) Windows cursor", 1, 24, FMT_BITMAP | FMT_SECONDARY | FMT_ALPHA,
      nullptr, NoInfo, NoRead, NoWrite},
     {"HAM", "(HAM) Amiga", 1, 24, FMT_BITMAP | FMT_SECONDARY,
