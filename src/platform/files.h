@@ -44,8 +44,8 @@ std::optional<std::vector<FolderEntry>> ListFolder(const std::string& path);
 // Renames within one file system. A destination that is there and neither a regular file nor a link stays: Failed. Where
 // case does not count, a name may be changed to itself in other case.
 [[nodiscard]] CommitResult RenameFile(const std::string& from, const std::string& to, Existing existing);
-// Moves a file or folder into the system's trash, from which its user can bring it back. False when there is none for
-// it; nothing has happened then.
+// Moves a file, folder or link into the system's trash, from which its user can bring it back. False when there is none
+// for it; nothing has happened then.
 [[nodiscard]] bool MoveToTrash(const std::string& path);
 // Whether MoveToTrash can work for that path, without doing it.
 bool HasTrash(const std::string& path);

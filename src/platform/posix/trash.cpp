@@ -1,0 +1,241 @@
+// The trash as desktops share it. A trash folder holds
+//
+//   files/NAME            what was deleted, under a name that is free there
+//   info/NAME.trashinfo   where it came from and when:
+//
+//       [Trash Info]
+//       Path=/home/user/a%20picture.bmp       percent-encoded; in a volume's own trash relative to the volume's top folder
+//       DeletionDate=2004-08-31T22:32:08      local time
+//
+// Files of the home folder's device go to $XDG_DATA_HOME/Trash, others to TOP/.Trash/UID (which the administrator made, with
+// the sticky bit) or TOP/.Trash-UID of their volume. The info file is created first, exclusively; it holds the name. The size
+// cache of folders ("directorysizes") is optional and left to the desktops.
+// Source: freedesktop.org, "The FreeDesktop.org Trash specification", version 1.0.
+
+#include <fcntl.h>
+#include <stdlib.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <cstdio>
+#include <memory>
+#include <string_view>
+#include <vector>
+
+#include "platform/clock.h"
+#include "platform/fault.h"
+#include "platform/files.h"
+#include "platform/folders.h"
+#include "platform/paths.h"
+#include "platform/posix/handle.h"
+
+namespace fotomill::platform {
+
+namespace {
+
+constexpr int kAttempts = 10'000;           // names tried for one file
+constexpr size_t kLongestBase = 200;        // bytes kept of a long name; number, extension and ".trashinfo" follow
+constexpr size_t kLongestExtension = 24;
+
+// What is to go: its folder without links and its own name.
+struct Victim {
+  std::string folder;
+  std::string name;
+  dev_t device = 0;
+  std::string Path() const { return JoinFolder(folder, name); }
+};
+
+// A trash folder for a victim and the path by which its info file remembers it.
+struct Place {
+  std::string folder;
+  std::string remembered;
+  bool shared = false;  // lies on a volume that others may write to: must be ours and no link
+};
+
+// Folders made on the way, taken away again unless the work succeeds.
+class MadeFolders {
+ public:
+  ~MadeFolders() {
+    for (size_t i = paths_.size(); i > 0; --i) rmdir(paths_[i - 1].c_str());
+  }
+  bool Make(const std::string& path) {
+    if (FaultDue()) return false;
+    if (mkdir(path.c_str(), 0700) != 0) return errno == EEXIST;
+    paths_.push_back(path);
+    return true;
+  }
+  bool MakeWithParents(const std::string& path) {
+    for (size_t end = path.find('/', 1); end != std::string::npos; end = path.find('/', end + 1)) {
+      if (!IsFolder(path.substr(0, end)) && !Make(path.substr(0, end))) return false;
+    }
+    return IsFolder(path) || Make(path);
+  }
+  void Keep() { paths_.clear(); }
+
+ private:
+  std::vector<std::string> paths_;
+};
+
+std::string RealPath(const std::string& path) {
+  const std::unique_ptr<char, decltype(&free)> real(realpath(path.c_str(), nullptr), free);
+  return real != nullptr ? std::string(real.get()) : std::string();
+}
+
+bool FindVictim(std::string path, Victim& victim) {
+  while (path.size() > 1 && path.back() == '/') path.pop_back();
+  const std::string folder(SplitPath(path).folder);
+  victim.name = FileNameOf(path);
+  victim.folder = RealPath(folder.empty() ? "." : folder);
+  struct stat facts;
+  if (victim.name.empty() || victim.name == "." || victim.name == ".." || victim.folder.empty()) return false;
+  if (lstat(victim.Path().c_str(), &facts) != 0) return false;
+  victim.device = facts.st_dev;
+  return true;
+}
+
+std::string HomeTrash() {
+  const char* data = std::getenv("XDG_DATA_HOME");
+  if (data != nullptr && data[0] == '/') return AbsolutePath(JoinFolder(data, "Trash"));
+  const std::string home = SpecialFolderPath(SpecialFolder::Home);
+  return home.empty() ? home : JoinFolder(home, ".local/share/Trash");
+}
+
+// The nearest folder on the way up that is there; "/" at last.
+std::string NearestFolder(std::string path) {
+  while (path.size() > 1 && !IsFolder(path)) path = AbsolutePath(path + "/..");
+  return path;
+}
+
+bool IsOnDevice(const std::string& path, dev_t device) {
+  struct stat facts;
+  return stat(path.c_str(), &facts) == 0 && facts.st_dev == device;
+}
+
+// The top folder of the volume that a folder without links lies on.
+std::string TopFolder(std::string folder, dev_t device) {
+  while (folder.size() > 1) {
+    std::string above = AbsolutePath(folder + "/..");
+    if (!IsOnDevice(above, device)) break;
+    folder = std::move(above);
+  }
+  return folder;
+}
+
+bool IsOwnFolder(const std::string& path) {
+  struct stat facts;
+  return lstat(path.c_str(), &facts) == 0 && S_ISDIR(facts.st_mode) && facts.st_uid == getuid();
+}
+
+// Where the victim may go, in the order of preference.
+std::vector<Place> PlacesFor(const Victim& victim) {
+  const std::string home = HomeTrash();
+  if (!home.empty() && IsOnDevice(NearestFolder(home), victim.device)) return {{home, victim.Path(), false}};
+  if (!IsOnDevice(victim.folder, victim.device)) return {};  // a volume's top folder itself
+  const std::string top = TopFolder(victim.folder, victim.device);
+  const std::string remembered = victim.Path().substr(top.size() == 1 ? 1 : top.size() + 1);
+  const std::string user = std::to_string(getuid());
+  std::vector<Place> places;
+  struct stat facts;
+  const std::string administered = JoinFolder(top, ".Trash");
+  if (lstat(administered.c_str(), &facts) == 0 && S_ISDIR(facts.st_mode) && (facts.st_mode & S_ISVTX) != 0) {
+    places.push_back({JoinFolder(administered, user), remembered, true});
+  }
+  places.push_back({JoinFolder(top, ".Trash-" + user), remembered, true});
+  return places;
+}
+
+std::string PercentEncoded(std::string_view path) {
+  constexpr std::string_view plain = "/-_.!~*'()";
+  std::string result;
+  for (const char c : path) {
+    const bool letter = (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || (c >= '0' && c <= '9');
+    if (letter || plain.find(c) != std::string_view::npos) {
+      result += c;
+    } else {
+      char code[4];
+      std::snprintf(code, sizeof code, "%%%02X", static_cast<unsigned char>(c));
+      result += code;
+    }
+  }
+  return result;
+}
+
+std::string InfoText(const std::string& remembered) {
+  const LocalTime time = LocalTimeOf(Now());
+  char date[80];
+  std::snprintf(date, sizeof date, "%04d-%02d-%02dT%02d:%02d:%02d", time.year, time.month, time.day, time.hour, time.minute,
+                time.second);
+  return "[Trash Info]\nPath=" + PercentEncoded(remembered) + "\nDeletionDate=" + date + "\n";
+}
+
+// The name tried at an attempt: the file's own, then "picture.2.bmp" and so on. Very long names are shortened, their whole
+// name is in the info file.
+std::string NameInTrash(const std::string& name, int attempt) {
+  const PathParts parts = SplitPath(name);
+  const std::string_view extension = parts.extension.substr(0, kLongestExtension);
+  std::string result(parts.base.substr(0, kLongestBase));
+  if (attempt > 1) result.append(1, '.').append(std::to_string(attempt));
+  return result.append(extension);
+}
+
+// Takes a name by creating its info file: Done, Taken or Failed (then nothing is left of it).
+CommitResult CreateInfo(const std::string& path, const std::string& text) {
+  if (FaultDue()) return CommitResult::Failed;
+  Handle handle = OpenHandle(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW, 0600);
+  if (!handle.IsOpen()) return errno == EEXIST ? CommitResult::Taken : CommitResult::Failed;
+  const bool written = !FaultDue() && WriteFully(handle.Number(), reinterpret_cast<const uint8_t*>(text.data()), text.size());
+  if (handle.Reset() && written) return CommitResult::Done;
+  unlink(path.c_str());
+  return CommitResult::Failed;
+}
+
+bool MoveTo(const Place& place, const Victim& victim) {
+  MadeFolders made;
+  const std::string files = JoinFolder(place.folder, "files"), info = JoinFolder(place.folder, "info");
+  if (!(place.shared ? made.Make(place.folder) && IsOwnFolder(place.folder) : made.MakeWithParents(place.folder))) return false;
+  if (!made.Make(files) || !made.Make(info)) return false;
+  if (place.shared && !(IsOwnFolder(files) && IsOwnFolder(info))) return false;
+  const std::string text = InfoText(place.remembered);
+  for (int attempt = 1; attempt <= kAttempts; ++attempt) {
+    const std::string name = NameInTrash(victim.name, attempt);
+    const std::string infoPath = JoinFolder(info, name + ".trashinfo");
+    CommitResult result = CreateInfo(infoPath, text);
+    if (result == CommitResult::Taken) continue;
+    if (result == CommitResult::Failed) return false;
+    result = FaultDue() ? CommitResult::Failed : RenameRefusing(victim.Path(), JoinFolder(files, name));
+    if (result == CommitResult::Done) {
+      made.Keep();
+      return true;
+    }
+    unlink(infoPath.c_str());
+    if (result == CommitResult::Failed) return false;
+  }
+  return false;
+}
+
+bool MayWriteTo(const std::string& folder) { return access(folder.c_str(), W_OK | X_OK) == 0; }
+
+}  // namespace
+
+bool MoveToTrash(const std::string& path) {
+  Victim victim;
+  if (!FindVictim(path, victim)) return false;
+  for (const Place& place : PlacesFor(victim)) {
+    if (MoveTo(place, victim)) return true;
+  }
+  return false;
+}
+
+bool HasTrash(const std::string& path) {
+  Victim victim;
+  if (!FindVictim(path, victim) || !MayWriteTo(victim.folder)) return false;
+  for (const Place& place : PlacesFor(victim)) {
+    const bool there = FileExists(place.folder);
+    if (there && place.shared && !IsOwnFolder(place.folder)) continue;
+    if (MayWriteTo(NearestFolder(there ? place.folder : std::string(SplitPath(place.folder).folder)))) return true;
+  }
+  return false;
+}
+
+}  // namespace fotomill::platform
