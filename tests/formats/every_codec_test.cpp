@@ -1,0 +1,309 @@
+// Holds for every codec of the registry, and for each new one without a line here: what it writes it reads back, broken
+// files and a failing system leave nothing half done, and progress is told.
+//
+// Pictures in tests/formats/FORMAT/good are read, described and cut short; a picture REFERENCE/NAME.bmp beside them, in
+// the folder tests/formats/FORMAT/reference, says what they show. Pictures in tests/formats/FORMAT/bad have the status
+// that reading them gives before their extension: "huge-width.3.bmp".
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <charconv>
+#include <filesystem>
+
+#include "core/text.h"
+#include "platform/paths.h"
+#include "support/codecs.h"
+#include "support/faults.h"
+#include "support/files.h"
+
+namespace fotomill::test {
+namespace {
+
+namespace fs = std::filesystem;
+
+// What comes back of a written picture, for the rows that cannot keep all of it.
+enum class Keeps { All, Size, Nothing };
+struct Keeping {
+  std::string_view extension;
+  Keeps keeps;
+};
+// clang-format off
+constexpr Keeping kKeepings[] = {
+    {"MAC", Keeps::Nothing},                        // one size for all pictures
+    {"FIT", Keeps::Size}, {"FTS", Keeps::Size},     // grey only
+    {"JPG", Keeps::Size}, {"JPEG", Keeps::Size},    // lossy
+    {"JPE", Keeps::Size}, {"JFI", Keeps::Size},
+    {"JFIF", Keeps::Size},
+};
+// clang-format on
+
+Keeps KeepsOf(const FormatEntry& row) {
+  for (const Keeping& keeping : kKeepings) {
+    if (keeping.extension == row.extension.view()) return keeping.keeps;
+  }
+  return Keeps::All;
+}
+
+template <typename Action>
+void ForEachRow(bool writable, Action action) {
+  for (int32_t i = 0; i < formatCount; ++i) {
+    const FormatEntry& row = FormatRow(i);
+    if (!CanRead(row) || (writable && !CanWrite(row))) continue;
+    SCOPED_TRACE(std::string(row.extension.view()));
+    action(row);
+  }
+}
+
+// The colour at a place, 0x00RRGGBB, whatever the depth.
+int32_t ColorAt(const PackedImage& image, int32_t x, int32_t y) {
+  const int32_t value = image.PixelAt(x, y);
+  if (image.Bits() == 24) return value;
+  const uint8_t* entry = image.ColorTable().data() + 4 * static_cast<size_t>(value);
+  return entry[2] << 16 | entry[1] << 8 | entry[0];
+}
+
+// Empty when both show the same, else where they differ first.
+std::string Difference(const PackedImage& a, const PackedImage& b) {
+  if (a.Width() != b.Width() || a.Height() != b.Height()) return "size";
+  for (int32_t y = 0; y < a.Height(); ++y) {
+    for (int32_t x = 0; x < a.Width(); ++x) {
+      if (ColorAt(a, x, y) != ColorAt(b, x, y)) return "column " + std::to_string(x) + ", row " + std::to_string(y);
+    }
+  }
+  return {};
+}
+
+std::vector<std::string> FilesIn(const fs::path& folder) {
+  std::vector<std::string> files;
+  if (!fs::is_directory(folder)) return files;
+  for (const auto& entry : fs::directory_iterator(folder)) {
+    if (entry.is_regular_file()) files.push_back(entry.path().string());
+  }
+  std::sort(files.begin(), files.end());
+  return files;
+}
+
+// The files in tests/formats/*/`kind`.
+std::vector<std::string> Fixtures(std::string_view kind) {
+  std::vector<std::string> files;
+  for (const auto& format : fs::directory_iterator(SourcePath("tests/formats"))) {
+    for (std::string& file : FilesIn(format.path() / kind)) files.push_back(std::move(file));
+  }
+  return files;
+}
+
+// Whole pictures of formats that can be read: the fixtures and the project's samples.
+std::vector<std::string> GoodPictures() {
+  std::vector<std::string> files = Fixtures("good");
+  for (std::string& file : FilesIn(SourcePath("samples"))) {
+    if (!platform::FileNameOf(file).starts_with("damaged")) files.push_back(std::move(file));
+  }
+  std::erase_if(files, [](const std::string& file) {
+    const int32_t row = FindFormatByName(file);
+    return row == kNoFormat || !CanRead(FormatRow(row));
+  });
+  return files;
+}
+
+// Counts what a codec tells.
+class CountingSink : public ProgressSink {
+ public:
+  void Begin() override { ++begun; }
+  void Step(int32_t done, int32_t total) override {
+    ++steps;
+    inRange = inRange && done >= 0 && done <= total;
+  }
+  void End() override { ++ended; }
+  int begun = 0, steps = 0, ended = 0;
+  bool inRange = true;
+};
+
+void ExpectWellBehaved(const CountingSink& sink) {
+  EXPECT_EQ(sink.begun, 1);
+  EXPECT_EQ(sink.ended, 1);
+  EXPECT_TRUE(sink.inRange);
+}
+
+Status InfoOf(const FormatEntry& row, const std::string& path, PictureRecord& picture) {
+  return row.info(picture, path.c_str(), 0);
+}
+
+TEST(EveryCodec, ReadsBackWhatItWrote) {
+  const TemporaryFolder folder;
+  ForEachRow(true, [&](const FormatEntry& row) {
+    const std::string path = folder.Path("picture." + LowerCase(row.extension.view()));
+    for (const int32_t bits : {1, 2, 3, 4, 5, 6, 7, 8, 24}) {
+      for (const int32_t width : {1, 3, 7, 8, 9, 33, 130}) {
+        if (bits > static_cast<int32_t>(row.maxBits)) continue;
+        SCOPED_TRACE(std::to_string(bits) + " bits, width " + std::to_string(width));
+        const PicturePointer picture = PatternPicture(width, 35, bits);
+        picture->fileName.AssignCut(path);
+        CountingSink sink;
+        picture->progress = &sink;
+        ASSERT_EQ(row.write(*picture, {}), Status::Ok);
+        ExpectWellBehaved(sink);
+
+        const PicturePointer described = NewPictureRecord(), back = NewPictureRecord();
+        sink = CountingSink();
+        back->progress = &sink;
+        ASSERT_EQ(InfoOf(row, path, *described), Status::Ok);
+        ASSERT_EQ(row.read(*back, path.c_str()), Status::Ok);
+        fs::remove(path);
+        ExpectWellBehaved(sink);
+        EXPECT_GE(sink.steps, 35);
+        EXPECT_EQ(described->width, back->image.Width());
+        EXPECT_EQ(described->height, back->image.Height());
+        EXPECT_EQ(NormalisedDepth(described->bitsPerPixel), back->image.Bits());
+        if (KeepsOf(row) != Keeps::Nothing) {
+          EXPECT_EQ(picture->image.Width(), back->image.Width());
+          EXPECT_EQ(picture->image.Height(), back->image.Height());
+        }
+        if (KeepsOf(row) == Keeps::All) {
+          EXPECT_EQ(Difference(picture->image, back->image), "");
+        }
+      }
+    }
+  });
+}
+
+TEST(EveryCodec, KeepsAlphaThatItsRowPromises) {
+  const TemporaryFolder folder;
+  ForEachRow(true, [&](const FormatEntry& row) {
+    if ((row.flags & FMT_ALPHA) == 0) return;
+    const PicturePointer picture = PatternPicture(33, 7, 24);
+    ASSERT_EQ(NewAlphaPlane(33, 7, picture->alpha), Status::Ok);
+    for (int32_t y = 0; y < 7; ++y) {
+      for (int32_t x = 0; x < 33; ++x) picture->alpha.Row(y)[static_cast<size_t>(x)] = static_cast<uint8_t>(x * 8 + y);
+    }
+    picture->alphaFlags = kHasAlpha;
+    const std::string path = folder.Path("picture." + LowerCase(row.extension.view()));
+    picture->fileName.AssignCut(path);
+    ASSERT_EQ(row.write(*picture, {}), Status::Ok);
+    const PicturePointer back = NewPictureRecord();
+    ASSERT_EQ(row.read(*back, path.c_str()), Status::Ok);
+    EXPECT_EQ(Difference(picture->image, back->image), "");
+    EXPECT_EQ(Difference(picture->alpha, back->alpha), "");
+    EXPECT_EQ(back->alphaFlags & kHasAlpha, kHasAlpha);
+  });
+}
+
+TEST(EveryCodec, ReadsGoodPictures) {
+  const std::vector<std::string> files = GoodPictures();
+  EXPECT_FALSE(files.empty());
+  for (const std::string& file : files) {
+    SCOPED_TRACE(file);
+    PicturePointer described, picture;
+    ASSERT_EQ(LoadPictureInfo(file.c_str(), described), Status::Ok);
+    ASSERT_EQ(LoadPicture(file.c_str(), picture), Status::Ok);
+    EXPECT_EQ(described->width, picture->image.Width());
+    EXPECT_EQ(described->height, picture->image.Height());
+    const fs::path path(file);
+    const fs::path reference =
+        path.parent_path().parent_path() / "reference" / path.filename().replace_extension(".bmp");
+    if (!fs::exists(reference)) continue;
+    PicturePointer expected;
+    ASSERT_EQ(LoadPicture(reference.c_str(), expected), Status::Ok);
+    EXPECT_EQ(Difference(expected->image, picture->image), "");
+  }
+}
+
+TEST(EveryCodec, RefusesBadPictures) {
+  for (const std::string& file : Fixtures("bad")) {
+    SCOPED_TRACE(file);
+    const std::string stem = fs::path(file).stem().extension().string();  // ".3"
+    int32_t status = -1;
+    if (!stem.empty()) std::from_chars(stem.data() + 1, stem.data() + stem.size(), status);
+    const int32_t row = FindFormatByName(file);
+    ASSERT_NE(row, kNoFormat);
+    const PicturePointer picture = NewPictureRecord();
+    EXPECT_EQ(StatusNumber(FormatRow(row).read(*picture, file.c_str())), status);
+    EXPECT_TRUE(picture->image.Empty());
+    EXPECT_TRUE(picture->alpha.Empty());
+  }
+}
+
+// Info, details and reading of a file that may be anything: never a picture together with a failure.
+void ExpectClean(const FormatEntry& row, const std::string& path) {
+  const PicturePointer picture = NewPictureRecord();
+  picture->fileName.AssignCut(path);
+  const Status described = InfoOf(row, path, *picture);
+  if (described == Status::Ok && row.details != nullptr) (void)row.details(*picture);
+  CountingSink sink;
+  picture->progress = &sink;
+  const Status status = row.read(*picture, path.c_str());
+  ExpectWellBehaved(sink);
+  EXPECT_EQ(picture->image.Empty(), status != Status::Ok);
+  if (status != Status::Ok) {
+    EXPECT_TRUE(picture->alpha.Empty());
+  }
+}
+
+TEST(EveryCodec, EndsCleanlyOnFilesCutShort) {
+  const TemporaryFolder folder;
+  for (const std::string& file : GoodPictures()) {
+    SCOPED_TRACE(file);
+    const FormatEntry& row = FormatRow(FindFormatByName(file));
+    const std::string path = folder.Path(platform::FileNameOf(file));
+    fs::copy_file(file, path);
+    const size_t size = fs::file_size(path), step = std::max<size_t>(size / 40, 1);
+    for (size_t length = size; length > 0;) {
+      length -= length <= 512 ? 1 : std::min(step, length - 512);
+      SCOPED_TRACE("cut to " + std::to_string(length));
+      fs::resize_file(path, length);
+      ExpectClean(row, path);
+    }
+  }
+}
+
+TEST(EveryCodec, EndsCleanlyWhenTheSystemFails) {
+  for (const std::string& file : GoodPictures()) {
+    SCOPED_TRACE(file);
+    const FormatEntry& row = FormatRow(FindFormatByName(file));
+    EXPECT_GT(ForEachFault([&] { ExpectClean(row, file); }), 0);
+  }
+}
+
+TEST(EveryCodec, FailedWriteLeavesTheDestinationAlone) {
+  ForEachRow(true, [&](const FormatEntry& row) {
+    const TemporaryFolder folder;
+    const std::string name = "picture." + LowerCase(row.extension.view());
+    const PicturePointer picture = PatternPicture(33, 20, static_cast<int32_t>(row.maxBits));
+    picture->fileName.AssignCut(folder.Path(name));
+    const int64_t faults = ForEachFault([&] {
+      WriteText(folder.Path(name), "old");
+      CountingSink sink;
+      picture->progress = &sink;
+      const Status status = row.write(*picture, {});
+      ExpectWellBehaved(sink);
+      EXPECT_EQ(ReadText(folder.Path(name)) == "old", status != Status::Ok);
+      EXPECT_EQ(folder.Names(), std::vector<std::string>{name});
+    });
+    EXPECT_GT(faults, 2);
+  });
+}
+
+TEST(EveryCodec, ReadsOrRefusesRealPictures) {
+  if (CorpusFolder().empty()) GTEST_SKIP() << "FOTOMILL_CORPUS names no folder";
+  size_t count = 0;
+  for (const auto& entry : fs::recursive_directory_iterator(CorpusFolder())) {
+    const std::string path = entry.path().string();
+    const int32_t index = entry.is_regular_file() ? FindFormatByName(path) : kNoFormat;
+    if (index == kNoFormat || !CanRead(FormatRow(index)) || path.size() > 260) continue;
+    SCOPED_TRACE(path);
+    const FormatEntry& row = FormatRow(index);
+    const PicturePointer described = NewPictureRecord(), picture = NewPictureRecord();
+    const Status info = InfoOf(row, path, *described);
+    const Status read = row.read(*picture, path.c_str());
+    EXPECT_EQ(picture->image.Empty(), read != Status::Ok);
+    if (read != Status::Ok) continue;
+    EXPECT_EQ(info, Status::Ok);
+    EXPECT_EQ(picture->image.Width(), described->width);
+    EXPECT_EQ(picture->image.Height(), described->height);
+    ++count;
+  }
+  EXPECT_GT(count, 0u);
+}
+
+}  // namespace
+}  // namespace fotomill::test
