@@ -11,7 +11,7 @@ struct Limits {
   uint64_t listFileBytes = uint64_t{16} << 20;     // an INI, override, history or list file
   uint32_t fitsCards = 65536;                      // cards of one FITS header
   uint32_t exifDirectories = 512;                  // directories of one EXIF block
-  uint32_t exifEntries = 65535;                    // entries in all directories of one EXIF block
+  uint32_t exifEntries = 65536;                    // entries in all directories of one EXIF block
   uint32_t exifValueCharacters = 4096;             // text of one value
   uint64_t exifTextBytes = uint64_t{4} << 20;      // text of one block
   uint64_t metadataBytes = uint64_t{64} << 20;     // one EXIF, XMP or ICC block kept with a picture

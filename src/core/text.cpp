@@ -32,6 +32,15 @@ int64_t LeadingInteger(std::string_view text) {
   return value;
 }
 
+std::string_view ListItem(std::string_view list, int64_t index) {
+  for (; index > 0; --index) {
+    const size_t end = list.find(';');
+    if (end == std::string_view::npos) return "Unknown";
+    list.remove_prefix(end + 1);
+  }
+  return index < 0 ? "Unknown" : list.substr(0, list.find(';'));
+}
+
 std::string WithThousands(uint64_t number) {
   std::string digits = std::to_string(number);
   for (size_t place = digits.size(); place > 3; place -= 3) digits.insert(place - 3, 1, ',');

@@ -25,6 +25,9 @@ constexpr bool EqualIgnoringCase(std::string_view a, std::string_view b) {
 // digit; a number beyond 64 bits gives the nearest one that fits.
 int64_t LeadingInteger(std::string_view text);
 
+// Item `index`, from 0, of a list whose items are separated by ";"; "Unknown" for an index that the list does not have.
+std::string_view ListItem(std::string_view list, int64_t index);
+
 // A number in decimal with a comma between every group of three digits.
 std::string WithThousands(uint64_t number);
 

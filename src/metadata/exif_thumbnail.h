@@ -1,0 +1,16 @@
+#pragma once
+
+#include <cstdint>
+#include <span>
+
+#include "core/status.h"
+#include "picture/picture_record.h"
+
+namespace fotomill {
+
+// Decodes an embedded thumbnail, a JPEG stream, by way of a working file with the extension ".JPG" that is deleted again.
+// `picture` is null unless Ok; EmptyImage (31) without bytes, ErrorCreatingFile (10) or ErrorWritingFile (11) for the working file,
+// else the status of the JPEG codec.
+Status DecodeExifThumbnail(std::span<const uint8_t> bytes, PicturePointer& picture);
+
+}  // namespace fotomill

@@ -1,0 +1,73 @@
+#include "metadata/gps.h"
+
+#include <algorithm>
+#include <charconv>
+#include <cmath>
+#include <numbers>
+
+#include "core/settings.h"
+#include "core/text.h"
+
+namespace fotomill {
+
+namespace {
+
+// Takes a number off the front of `text`, with blanks and a plus sign before it.
+template <typename Number>
+bool TakeNumber(std::string_view& text, Number& number) {
+  text.remove_prefix(std::min(text.find_first_not_of(" \t"), text.size()));
+  if (text.starts_with('+')) text.remove_prefix(1);
+  const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
+  if (error != std::errc{}) return false;
+  text.remove_prefix(static_cast<size_t>(end - text.data()));
+  return true;
+}
+
+bool TakeComma(std::string_view& text) {
+  if (!text.starts_with(',')) return false;
+  text.remove_prefix(1);
+  return true;
+}
+
+bool TakeAngle(std::string_view& text, GpsAngle& angle) {
+  if (!TakeNumber(text, angle.degrees) || !TakeComma(text) || !TakeNumber(text, angle.minutes) || !TakeComma(text) ||
+      !TakeNumber(text, angle.seconds) || !TakeComma(text) || text.empty()) {
+    return false;
+  }
+  angle.hemisphere = text.front();
+  text.remove_prefix(1);
+  return std::isfinite(angle.seconds);
+}
+
+}  // namespace
+
+bool ParseGpsLocation(std::string_view text, GpsLocation& location) {
+  location = {};
+  GpsLocation parsed;
+  if (!TakeAngle(text, parsed.latitude) || !TakeComma(text) || !TakeAngle(text, parsed.longitude)) return false;
+  location = parsed;
+  return true;
+}
+
+bool DefaultGpsLocation(GpsLocation& location) { return ParseGpsLocation(settings.ExifDefaultLocation, location); }
+
+double GpsDegrees(const GpsAngle& angle) {
+  const char letter = UpperCase(angle.hemisphere);
+  const double sign = letter == 'W' || letter == 'S' ? -1 : 1;
+  return sign * (angle.degrees + angle.minutes / 60.0 + angle.seconds / 3600.0);
+}
+
+double GpsDistance(double latitude1, double longitude1, double latitude2, double longitude2) {
+  constexpr double kRadians = std::numbers::pi / 180;
+  const double radius = settings.ExifDistinceUnits == 0 ? 3956 : 6367;
+  const double alongLatitude = std::sin((latitude2 - latitude1) * kRadians / 2);
+  const double alongLongitude = std::sin((longitude2 - longitude1) * kRadians / 2);
+  const double a = alongLatitude * alongLatitude + std::cos(latitude1 * kRadians) * std::cos(latitude2 * kRadians) *
+                                                       alongLongitude * alongLongitude;
+  const double part = std::clamp(a, 0.0, 1.0);  // rounding may leave the range where the places are opposite
+  return radius * 2 * std::atan2(std::sqrt(part), std::sqrt(1 - part));
+}
+
+std::string_view GpsDistanceUnit() { return settings.ExifDistinceUnits == 0 ? "miles" : "kilometers"; }
+
+}  // namespace fotomill
