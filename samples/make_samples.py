@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""Draws a windmill and writes it as every kind of BMP and PCX file that a user meets, one of them damaged.
+"""Draws a windmill and writes it as every kind of picture file that a user meets, one of them damaged.
 
 make_samples.py [FOLDER]: writes into FOLDER, by default the folder of this script. The Python standard library is all it
 needs. README.md beside it says what each file is.
@@ -235,6 +235,54 @@ def pcx(bits, rows, palette=()):
     return header + b"".join(pcx_runs(plane) for row in rows for plane in row) + trailer
 
 
+# FITS, X bitmap, MacPaint.
+
+def fits(rows):
+    """`rows` are bytes of grey from top to bottom."""
+    cards = ("SIMPLE  = T", "BITPIX  = 8", "NAXIS   = 2", f"NAXIS1  = {len(rows[0])}", f"NAXIS2  = {len(rows)}", "END")
+    header = "".join(keyword.ljust(10) + value.rjust(20) + " " * 50
+                     for keyword, value in ((card[:9], card[9:].strip()) for card in cards))
+    data = b"".join(rows)
+    return header.ljust(2880).encode() + data + bytes(-len(data) % 2880)
+
+
+def xbm(rows, name):
+    """`rows` are indexes, 0 black, in a multiple of eight columns."""
+    values = [f"0x{255 - int(''.join(map(str, row[at:at + 8][::-1])), 2):02x}"
+              for row in rows for at in range(0, len(row), 8)]
+    lines = [", ".join(values[at:at + 12]) for at in range(0, len(values), 12)]
+    return (f"#define {name}_width {len(rows[0])}\n#define {name}_height {len(rows)}\nstatic char {name}_bits[] = {{\n"
+            + ",\n".join(lines) + "};\n").encode()
+
+
+def pack_bits(line):
+    """Runs of three and more, literals between them."""
+    out, at = b"", 0
+    while at < len(line):
+        end = at
+        while end < len(line) and run_length(line, end) < 3:
+            end += 1
+        if end > at:
+            out += bytes((end - at - 1,)) + line[at:end]
+            at = end
+        if at < len(line):
+            count = run_length(line, at)
+            out += bytes((257 - count, line[at]))
+            at += count
+    return out
+
+
+def mac_paint(rows, name):
+    """`rows` are indexes, 0 black. They stand in the middle of the page, behind a MacBinary header without dates."""
+    left, top = (576 - len(rows[0])) // 2, (720 - len(rows)) // 2
+    page = [[0] * 576 for _ in range(720)]
+    for y, row in enumerate(rows):
+        page[top + y][left:left + len(row)] = [1 - index for index in row]
+    data = struct.pack(">I508x", 2) + b"".join(pack_bits(packed(row, 1)) for row in page)
+    header = struct.pack(">xB63s4s4s10xI41x", len(name), name.encode(), b"PNTG", b"MPNT", len(data))
+    return header + data
+
+
 def main():
     folder = Path(sys.argv[1]) if len(sys.argv) > 1 else Path(__file__).resolve().parent
     picture = draw()
@@ -269,6 +317,9 @@ def main():
         "256-colours.pcx": pcx256,
         "true-colour.pcx": pcx(8, [[bytes(pixel[channel] for pixel in row) for channel in range(3)] for row in picture]),
         "damaged.pcx": pcx256[:len(pcx256) // 2],
+        "grey.fits": fits([bytes((30 * r + 59 * g + 11 * b) // 100 for r, g, b in row) for row in picture]),
+        "mono.xbm": xbm([row[3:147] for row in mono], "windmill"),
+        "mono.mac": mac_paint(mono, "Windmill"),
     }
     for name, contents in files.items():
         (folder / name).write_bytes(contents)

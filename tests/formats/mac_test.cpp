@@ -35,7 +35,7 @@ Bytes Join(std::initializer_list<Bytes> parts) {
 // Packed rows that are white from the first column to the last.
 Bytes WhiteRows(size_t count) {
   Bytes rows;
-  for (; count > 0; --count) rows = Join({rows, Hex("B9 00")});
+  for (; count > 0; --count) rows.insert(rows.end(), {0xB9, 0x00});
   return rows;
 }
 
