@@ -1,6 +1,7 @@
 #include "core/nearest_name.h"
 
 #include <algorithm>
+#include <cstdint>
 #include <vector>
 
 #include "core/text.h"
@@ -30,12 +31,9 @@ size_t EditDistance(std::string_view a, std::string_view b) {
   return last[b.size()];
 }
 
-}  // namespace
-
-std::string_view NearestName(std::string_view typed, std::span<const std::string_view> names) {
-  if (typed.empty() || typed.size() > kLongestName) return {};
+// The name whose distance is below `fewest` and smallest, with at least one character in place.
+std::string_view NearestBelow(size_t fewest, std::string_view typed, std::span<const std::string_view> names) {
   std::string_view nearest;
-  size_t fewest = typed.size() / 3 + 2;  // one slip in a short word, one more for every three letters
   for (const std::string_view name : names) {
     if (name.size() > kLongestName) continue;
     const bool beginning = typed.size() >= 2 && EqualIgnoringCase(name.substr(0, typed.size()), typed);
@@ -46,6 +44,19 @@ std::string_view NearestName(std::string_view typed, std::span<const std::string
     }
   }
   return nearest;
+}
+
+}  // namespace
+
+std::string_view NearestName(std::string_view typed, std::span<const std::string_view> names) {
+  if (typed.empty() || typed.size() > kLongestName) return {};
+  const size_t fewest = typed.size() / 3 + 2;  // one slip in a short word, one more for every three letters
+  return NearestBelow(fewest, typed, names);
+}
+
+std::string_view NearestOfAll(std::string_view typed, std::span<const std::string_view> names) {
+  const std::string_view nearest = NearestBelow(SIZE_MAX, typed.substr(0, kLongestName), names);
+  return nearest.empty() && !names.empty() ? names.front() : nearest;
 }
 
 std::string NearestNameHint(std::string_view typed, std::span<const std::string_view> names) {

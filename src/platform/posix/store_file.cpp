@@ -12,7 +12,6 @@
 #include <utility>
 
 #include "platform/fault.h"
-#include "platform/files.h"
 #include "platform/posix/handle.h"
 #include "platform/process.h"
 
@@ -22,6 +21,13 @@ namespace {
 
 constexpr std::chrono::microseconds kFirstPause{100};
 constexpr std::chrono::microseconds kLongestPause{10'000};
+
+// Whether an open failed because there is nothing of that name. A link that leads nowhere is something; a file that has
+// come since then is not asked for, or who creates and removes files side by side would meet errors that are none.
+bool IsNoName(const std::string& path, int error) {
+  struct stat facts;
+  return (error == ENOENT || error == ENOTDIR) && (lstat(path.c_str(), &facts) != 0 || !S_ISLNK(facts.st_mode));
+}
 
 bool InRange(uint64_t offset, size_t size) { return offset <= INT64_MAX && size <= INT64_MAX - offset; }
 
@@ -47,7 +53,7 @@ StoreFile::OpenResult StoreFile::Open(const std::string& path, Mode mode) {
   } else {
     struct stat facts;
     handle = OpenRegular(path.c_str(), mode == Mode::Read ? O_RDONLY : O_RDWR | O_NOFOLLOW, facts);
-    if (!handle.IsOpen()) return FileExists(path) ? OpenResult::Failed : OpenResult::Missing;
+    if (!handle.IsOpen()) return IsNoName(path, errno) ? OpenResult::Missing : OpenResult::Failed;
   }
   handle_ = handle.Release();
   return OpenResult::Done;
