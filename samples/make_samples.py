@@ -298,28 +298,28 @@ def main():
     pcx256 = pcx(8, [[bytes(row)] for row in picture256], colours256)
 
     files = {
-        "mono.bmp": bmp(1, bmp_rows(mono, lambda row: packed(row, 1)), black_white),
-        "16-colours.bmp": bmp(4, bmp_rows(picture16, lambda row: packed(row, 4)), colours16),
-        "256-colours.bmp": bmp(8, bmp_rows(picture256, bytes), colours256),
-        "true-colour.bmp": bmp(24, bmp_rows(picture, blue_first)),
-        "alpha.bmp": bmp(32, bmp_rows(with_alpha, lambda row: b"".join(map(bytes, row)))),
-        "rle4.bmp": bmp(4, bmp_runs(flat16, 4), colours16, compression=2),
-        "rle8.bmp": bmp(8, bmp_runs(flat64, 8), colours64 + [(0, 0, 0)] * 192, compression=1),
-        "high-colour-555.bmp": bmp(16, bmp_rows(picture, lambda row: high_colour(row, 5))),
-        "high-colour-565.bmp": bmp(16, bmp_rows(picture, lambda row: high_colour(row, 6)), compression=3,
+        "bmp-mono.bmp": bmp(1, bmp_rows(mono, lambda row: packed(row, 1)), black_white),
+        "bmp-16-colours.bmp": bmp(4, bmp_rows(picture16, lambda row: packed(row, 4)), colours16),
+        "bmp-256-colours.bmp": bmp(8, bmp_rows(picture256, bytes), colours256),
+        "bmp-true-colour.bmp": bmp(24, bmp_rows(picture, blue_first)),
+        "bmp-alpha.bmp": bmp(32, bmp_rows(with_alpha, lambda row: b"".join(map(bytes, row)))),
+        "bmp-rle4.bmp": bmp(4, bmp_runs(flat16, 4), colours16, compression=2),
+        "bmp-rle8.bmp": bmp(8, bmp_runs(flat64, 8), colours64 + [(0, 0, 0)] * 192, compression=1),
+        "bmp-high-colour-555.bmp": bmp(16, bmp_rows(picture, lambda row: high_colour(row, 5))),
+        "bmp-high-colour-565.bmp": bmp(16, bmp_rows(picture, lambda row: high_colour(row, 6)), compression=3,
                                    masks=struct.pack("<III", 0xF800, 0x07E0, 0x001F)),
-        "os2.bmp": os2_bmp(8, bmp_rows(picture256, bytes), colours256),
-        "top-down.bmp": bmp(8, bmp_rows(picture256[::-1], bytes), colours256, height=-HEIGHT),
-        "mono.pcx": pcx(1, [[packed(row, 1)] for row in mono], black_white),
-        "16-colours.pcx": pcx(1, [[packed([index >> plane & 1 for index in row], 1) for plane in range(4)]
+        "bmp-os2.bmp": os2_bmp(8, bmp_rows(picture256, bytes), colours256),
+        "bmp-top-down.bmp": bmp(8, bmp_rows(picture256[::-1], bytes), colours256, height=-HEIGHT),
+        "pcx-mono.pcx": pcx(1, [[packed(row, 1)] for row in mono], black_white),
+        "pcx-16-colours.pcx": pcx(1, [[packed([index >> plane & 1 for index in row], 1) for plane in range(4)]
                                   for row in picture16], colours16),
-        "16-colours-packed.pcx": pcx(4, [[packed(row, 4)] for row in picture16], colours16),
-        "256-colours.pcx": pcx256,
-        "true-colour.pcx": pcx(8, [[bytes(pixel[channel] for pixel in row) for channel in range(3)] for row in picture]),
+        "pcx-16-colours-packed.pcx": pcx(4, [[packed(row, 4)] for row in picture16], colours16),
+        "pcx-256-colours.pcx": pcx256,
+        "pcx-true-colour.pcx": pcx(8, [[bytes(pixel[channel] for pixel in row) for channel in range(3)] for row in picture]),
         "damaged.pcx": pcx256[:len(pcx256) // 2],
-        "grey.fits": fits([bytes((30 * r + 59 * g + 11 * b) // 100 for r, g, b in row) for row in picture]),
-        "mono.xbm": xbm([row[3:147] for row in mono], "windmill"),
-        "mono.mac": mac_paint(mono, "Windmill"),
+        "fits-grey.fits": fits([bytes((30 * r + 59 * g + 11 * b) // 100 for r, g, b in row) for row in picture]),
+        "xbm-mono.xbm": xbm([row[3:147] for row in mono], "windmill"),
+        "mac-mono.mac": mac_paint(mono, "Windmill"),
     }
     for name, contents in files.items():
         (folder / name).write_bytes(contents)
