@@ -30,6 +30,9 @@ cmake_minimum_required(VERSION 3.25)
 project(small LANGUAGES C)
 message(STATUS "chatter")
 add_executable(fotomill src/main.c)
+if(EXISTS ${CMAKE_SOURCE_DIR}/src/desktop)
+  add_executable(fotomill-desktop src/main.c)
+endif()
 add_custom_target(test_support)
 set(CMAKE_RUNTIME_OUTPUT_DIRECTORY ${CMAKE_BINARY_DIR}/tests)
 file(GLOB cases CONFIGURE_DEPENDS tests/*.c)
@@ -69,6 +72,9 @@ Expect "two at a time" "three three" "$(echo $("$tree/fotomill" </dev/null 2>/de
   sed 's/threethree/three three/')"
 mv "$tree" "$work/moved" && tree=$work/moved
 Expect "a tree that was moved" "three" "$("$tree/fotomill" </dev/null 2>/dev/null)"
+Expect "no desktop program yet: a command like others" "three desktop X" "$("$tree/fotomill" desktop X </dev/null 2>/dev/null)"
+mkdir "$tree/src/desktop"
+Expect "the desktop program, once it is there" "three X" "$("$tree/fotomill" desktop X </dev/null 2>/dev/null)"
 printf '[build]\nno-such-package-anywhere\n[cli]\n' >"$tree/packages.txt"
 for tool in apt-get sudo; do printf '#!/bin/sh\nexit 1\n' >"$work/bin/$tool"; done
 chmod +x "$work"/bin/* && rm "$work"/bin/{ninja,cmake,dpkg-query}
