@@ -26,7 +26,9 @@ constexpr std::array<std::array<int32_t, 8>, 8> MakePattern() {
 constexpr auto kPattern = MakePattern();
 static_assert(kPattern[0][0] == 0 && kPattern[0][1] == 32 && kPattern[1][0] == 48 && kPattern[1][1] == 16);
 
-constexpr int32_t Clamp(int32_t value) { return std::clamp(value, 0, 255); }
+constexpr int32_t Clamp(int32_t value) {
+  return std::clamp(value, 0, 255);
+}
 
 }  // namespace
 
@@ -74,8 +76,8 @@ void ErrorDiffuser::GreyRow(const uint8_t* grey, uint8_t* indices) {
   backwards_ = serpentine_ && !backwards_;
 }
 
-// A pixel hands 7/16 of its error ahead, and 3/16, 5/16 and 1/16 down: to the pixel below the last, below itself and below
-// the next. What was handed down to a pixel is read before its own row hands on to the same place.
+// A pixel hands 7/16 of its error ahead, and 3/16, 5/16 and 1/16 down: to the pixel below the last, below itself and
+// below the next. What was handed down to a pixel is read before its own row hands on to the same place.
 template <int step>
 void ErrorDiffuser::DiffuseRow(const uint8_t* bgr, NearestColor& nearest, uint8_t* indices) {
   int32_t ahead[3] = {}, belowLast[3] = {}, belowHere[3] = {};
@@ -83,7 +85,8 @@ void ErrorDiffuser::DiffuseRow(const uint8_t* bgr, NearestColor& nearest, uint8_
   for (int32_t left = width_; left > 0; --left, x += step) {
     int32_t* below = below_ + 3 * static_cast<std::ptrdiff_t>(x);
     int32_t wanted[3];
-    for (int c = 0; c < 3; ++c) wanted[c] = Clamp(bgr[3 * static_cast<std::ptrdiff_t>(x) + c] + ((ahead[c] + below[c] + 8) >> 4));
+    for (int c = 0; c < 3; ++c)
+      wanted[c] = Clamp(bgr[3 * static_cast<std::ptrdiff_t>(x) + c] + ((ahead[c] + below[c] + 8) >> 4));
     const uint8_t index = nearest.Find(wanted[0], wanted[1], wanted[2]);
     indices[x] = index;
     const int16_t* color = nearest.ColorOf(index);

@@ -12,8 +12,8 @@ namespace {
 // Pixels of a tile's side: source and destination of a tile stay in the first cache while rows become columns.
 constexpr int32_t kTile = 32;
 
-// An orientation as: does the destination's column run along the source's rows, and which ends are exchanged, counted in
-// the source.
+// An orientation as: does the destination's column run along the source's rows, and which ends are exchanged, counted
+// in the source.
 struct Turn {
   bool swap, flipX, flipY;
 };

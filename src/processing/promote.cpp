@@ -41,7 +41,9 @@ int32_t Brightness(uint32_t color) {
   return static_cast<int32_t>(299 * (color >> 16) + 587 * (color >> 8 & 0xff) + 114 * (color & 0xff));
 }
 
-constexpr int32_t DepthForColors(int32_t colors) { return colors <= 2 ? 1 : colors <= 16 ? 4 : 8; }
+constexpr int32_t DepthForColors(int32_t colors) {
+  return colors <= 2 ? 1 : colors <= 16 ? 4 : 8;
+}
 
 }  // namespace
 
@@ -158,9 +160,8 @@ void ColorSet::Number(Palette& palette) {
   for (const uint32_t slot : slots_) {
     if (slot != kFree) colors[found++] = slot;
   }
-  std::sort(colors.begin(), colors.begin() + static_cast<std::ptrdiff_t>(found), [](uint32_t a, uint32_t b) {
-    return std::pair(Brightness(a), a) < std::pair(Brightness(b), b);
-  });
+  std::sort(colors.begin(), colors.begin() + static_cast<std::ptrdiff_t>(found),
+            [](uint32_t a, uint32_t b) { return std::pair(Brightness(a), a) < std::pair(Brightness(b), b); });
   palette.fill(0);
   for (size_t i = 0; i < found; ++i) {
     indices_[SlotOf(colors[i])] = static_cast<uint8_t>(i);

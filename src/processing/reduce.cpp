@@ -238,7 +238,8 @@ Status ReduceColors(PictureRecord& picture, int32_t maxBits, const ReduceOptions
   const ProgressScope progress(picture);
   Reduction work{picture, options, bits, {}, {}, {}};
   RETURN_IF_BAD(work.source.Open(picture.image, options));
-  if (!work.indices.Allocate(static_cast<uint64_t>(work.Width()), platform::Fill::Unset)) return Status::MemoryAllocationError;
+  if (!work.indices.Allocate(static_cast<uint64_t>(work.Width()), platform::Fill::Unset))
+    return Status::MemoryAllocationError;
   int32_t count = 2;
   if (bits == 1) {
     work.palette = EvenGreys(2);

@@ -11,8 +11,8 @@ using test::MakePicture;
 // `count` colours, all different, in a picture of 37 x 23 pixels.
 PicturePointer PictureOfColors(uint32_t count) {
   return MakePicture(37, 23, [count](int32_t x, int32_t y) {
-    const uint32_t i = static_cast<uint32_t>(y * 37 + x) < count ? static_cast<uint32_t>(y * 37 + x)
-                                                                  : test::Scatter(x, y) % count;
+    const uint32_t i =
+        static_cast<uint32_t>(y * 37 + x) < count ? static_cast<uint32_t>(y * 37 + x) : test::Scatter(x, y) % count;
     return i * 0x010307u & 0xffffff;
   });
 }
@@ -25,10 +25,16 @@ TEST(Promote, FewColorsArePackedExactlyAndComeBack) {
     int32_t bits;
   };
   const Row rows[] = {
-      {"one colour", 1, 8, 1},          {"two colours", 2, 8, 1},         {"three colours", 3, 8, 4},
-      {"sixteen colours", 16, 8, 4},    {"seventeen colours", 17, 8, 8},  {"256 colours", 256, 8, 8},
-      {"257 colours stay", 257, 8, 24}, {"sixteen where 4 bits are allowed", 16, 4, 4},
-      {"seventeen where 4 bits are allowed", 17, 4, 24}, {"three where 1 bit is allowed", 3, 1, 24},
+      {"one colour", 1, 8, 1},
+      {"two colours", 2, 8, 1},
+      {"three colours", 3, 8, 4},
+      {"sixteen colours", 16, 8, 4},
+      {"seventeen colours", 17, 8, 8},
+      {"256 colours", 256, 8, 8},
+      {"257 colours stay", 257, 8, 24},
+      {"sixteen where 4 bits are allowed", 16, 4, 4},
+      {"seventeen where 4 bits are allowed", 17, 4, 24},
+      {"three where 1 bit is allowed", 3, 1, 24},
   };
   for (const Row& row : rows) {
     SCOPED_TRACE(row.name);

@@ -10,7 +10,9 @@ namespace {
 using test::Colors;
 using test::MakePicture;
 
-uint32_t Grey(int32_t level) { return static_cast<uint32_t>(level) * 0x010101u; }
+uint32_t Grey(int32_t level) {
+  return static_cast<uint32_t>(level) * 0x010101u;
+}
 
 PicturePointer Sweep(int32_t width, int32_t height) {
   return MakePicture(width, height, [=](int32_t x, int32_t y) {
@@ -48,9 +50,8 @@ TEST(Reduce, DepthFollowsTheAim) {
 TEST(Reduce, FewColorsAreKeptExactly) {
   for (const int32_t bits : {1, 4, 8}) {
     SCOPED_TRACE(bits);
-    const PicturePointer picture = MakePicture(50, 40, [bits](int32_t x, int32_t y) {
-      return test::Scatter(x, y) % (1u << bits) * 0x050301u;
-    });
+    const PicturePointer picture =
+        MakePicture(50, 40, [bits](int32_t x, int32_t y) { return test::Scatter(x, y) % (1u << bits) * 0x050301u; });
     const std::vector<uint32_t> before = Colors(*picture);
     ASSERT_EQ(ReduceColors(*picture, bits), Status::Ok);
     EXPECT_EQ(picture->bitsPerPixel, bits);
@@ -65,9 +66,8 @@ TEST(Reduce, DitheredGreysKeepTheirMean) {
       for (int32_t level = 0; level <= 255; level += 5) {
         SCOPED_TRACE(testing::Message() << level << ", dither " << static_cast<int32_t>(dither));
         // Two pixels of other colours keep the picture from being packed exactly.
-        const PicturePointer picture = MakePicture(128, 128, [level](int32_t x, int32_t y) {
-          return y == 0 && x < 2 ? Grey(100 + x) : Grey(level);
-        });
+        const PicturePointer picture = MakePicture(
+            128, 128, [level](int32_t x, int32_t y) { return y == 0 && x < 2 ? Grey(100 + x) : Grey(level); });
         ReduceOptions options;
         options.monoDither = dither;
         options.serpentine = serpentine;
@@ -81,7 +81,9 @@ TEST(Reduce, DitheredGreysKeepTheirMean) {
 }
 
 TEST(Reduce, ThresholdPartsDarkFromBright) {
-  const auto makeSteps = [] { return MakePicture(4, 1, [](int32_t x, int32_t) { return Grey(40 + 20 * x * x); }); };  // 40 60 120 220
+  const auto makeSteps = [] {
+    return MakePicture(4, 1, [](int32_t x, int32_t) { return Grey(40 + 20 * x * x); });
+  };  // 40 60 120 220
   struct Row {
     const char* name;
     int32_t threshold;
@@ -105,7 +107,8 @@ TEST(Reduce, ThresholdPartsDarkFromBright) {
 }
 
 TEST(Reduce, AlphaGoesToTheBackgroundFirst) {
-  const PicturePointer picture = MakePicture(20, 20, [](int32_t x, int32_t y) { return test::Scatter(x, y) & 0xffffff; });
+  const PicturePointer picture =
+      MakePicture(20, 20, [](int32_t x, int32_t y) { return test::Scatter(x, y) & 0xffffff; });
   test::AddAlpha(*picture, [](int32_t, int32_t) { return 0; });
   picture->defaultColour = 0x102030;  // blue, green, red
   ASSERT_EQ(ReduceColors(*picture, 8), Status::Ok);

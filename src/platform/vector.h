@@ -1,0 +1,32 @@
+#pragma once
+
+// Functions for processors that have more than the build's baseline. What stands between VECTOR_AVX2_BEGIN and
+// VECTOR_AVX2_END is compiled for AVX2 where the build knows it (VECTOR_HAS_AVX2 is 1), and may be called when
+// HasAvx2() says so. Nothing that the baseline uses too, such as a header of the standard library, may be included there.
+
+#if defined(__x86_64__)
+#include <immintrin.h>
+#define VECTOR_HAS_AVX2 1
+#if defined(__clang__)
+#define VECTOR_AVX2_BEGIN _Pragma("clang attribute push(__attribute__((target(\"avx2\"))), apply_to = function)")
+#define VECTOR_AVX2_END _Pragma("clang attribute pop")
+#else
+#define VECTOR_AVX2_BEGIN _Pragma("GCC push_options") _Pragma("GCC target(\"avx2\")")
+#define VECTOR_AVX2_END _Pragma("GCC pop_options")
+#endif
+#else
+#define VECTOR_HAS_AVX2 0
+#endif
+
+namespace fotomill::platform {
+
+inline bool HasAvx2() {
+#if VECTOR_HAS_AVX2
+  static const bool has = __builtin_cpu_supports("avx2");
+  return has;
+#else
+  return false;
+#endif
+}
+
+}  // namespace fotomill::platform
