@@ -2,6 +2,7 @@
 
 #include <sys/stat.h>
 
+#include <atomic>
 #include <cstdint>
 #include <string>
 
@@ -47,6 +48,11 @@ Handle OpenRegular(const char* path, int flags, struct stat& facts);
 int64_t ReadFully(int handle, uint8_t* data, uint64_t size, int64_t offset = -1);
 // Writes all of it, or answers false.
 bool WriteFully(int handle, const uint8_t* data, uint64_t size, int64_t offset = -1);
+
+// Whether outputs are made without a name and get it when they are whole (O_TMPFILE). Tests walk the ways of systems that
+// cannot make such files, or that make them and then refuse the name.
+enum class UnnamedFiles { Work, DoNotWork, GetNoName };
+extern std::atomic<UnnamedFiles> unnamedFiles;
 
 // fsync(2), repeated when a signal interrupts it.
 bool SyncHandle(int handle);

@@ -1,115 +1,191 @@
 #include "platform/output_file.h"
 
 #include <fcntl.h>
+#include <sys/sendfile.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <atomic>
 #include <cerrno>
 #include <cstdio>
+#include <utility>
 
 #include "platform/fault.h"
+#include "platform/files.h"
 #include "platform/paths.h"
-
-#ifndef RENAME_NOREPLACE
-#define RENAME_NOREPLACE 1
-#endif
+#include "platform/posix/handle.h"
+#include "platform/posix/temporary_names.h"
 
 namespace fotomill::platform {
 
+std::atomic<UnnamedFiles> unnamedFiles{UnnamedFiles::Work};
+
 namespace {
+
+constexpr int kAttempts = 100;
+constexpr size_t kCopyStep = size_t{1} << 30;
+
+std::string FolderOf(const std::string& path) {
+  const std::string folder(SplitPath(path).folder);
+  return folder.empty() ? "." : folder;
+}
 
 // ".fmw-PID-N.tmp" beside the destination: hidden, short, and unique within this machine and process.
 std::string TemporarySibling(const std::string& path) {
   static std::atomic<unsigned> counter{0};
   char name[64];
   std::snprintf(name, sizeof name, ".fmw-%ld-%u.tmp", static_cast<long>(getpid()), ++counter);
-  const PathParts parts = SplitPath(path);
-  return JoinFolder(parts.folder, name);
+  return JoinFolder(SplitPath(path).folder, name);
 }
 
-bool WriteAll(int handle, const uint8_t* data, size_t size, int64_t offset) {
-  while (size > 0) {
-    const ssize_t count = offset < 0 ? write(handle, data, size) : pwrite(handle, data, size, offset);
-    if (count < 0 && errno == EINTR) continue;
-    if (count <= 0) return false;
-    data += count;
-    size -= static_cast<size_t>(count);
-    if (offset >= 0) offset += count;
+// The name under which the system leads to an open file, whatever its own is.
+std::string HandlePath(int handle) { return "/proc/self/fd/" + std::to_string(handle); }
+
+Handle OpenUnnamed(const std::string& folder, mode_t mode) {
+  static const bool canBeNamed = access("/proc/self/fd", X_OK) == 0;
+  if (!canBeNamed || unnamedFiles == UnnamedFiles::DoNotWork) return Handle();
+  return OpenHandle(folder.c_str(), O_TMPFILE | O_RDWR, mode);
+}
+
+// Gives an unnamed file a name; false with errno.
+bool NameUnnamed(int handle, const std::string& path) {
+  if (unnamedFiles == UnnamedFiles::GetNoName) {
+    errno = EPERM;
+    return false;
   }
-  return true;
+  return linkat(AT_FDCWD, HandlePath(handle).c_str(), AT_FDCWD, path.c_str(), AT_SYMLINK_FOLLOW) == 0;
 }
 
-void SyncFolderOf(const std::string& path) {
-  const std::string folder(SplitPath(path).folder);
-  const int handle = open(folder.empty() ? "." : folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
-  if (handle < 0) return;
-  fsync(handle);
-  close(handle);
+// Has the system report errors that it keeps for the closing of a file, while the file stays open.
+bool CloseCopyOf(int handle) {
+  Handle copy(fcntl(handle, F_DUPFD_CLOEXEC, 0));
+  return copy.IsOpen() && copy.Reset();
+}
+
+// Whether `path` may become a file: free, a link, or a regular file that may be written to, whose permissions then go to
+// `mode` with `keepMode` set.
+bool MayBecome(const std::string& path, mode_t& mode, bool& keepMode) {
+  struct stat facts;
+  if (lstat(path.c_str(), &facts) != 0) return errno == ENOENT;
+  if (S_ISLNK(facts.st_mode)) return true;
+  if (!S_ISREG(facts.st_mode) || faccessat(AT_FDCWD, path.c_str(), W_OK, AT_EACCESS) != 0) return false;
+  mode = facts.st_mode & 0777;
+  keepMode = true;
+  return true;
 }
 
 }  // namespace
 
 bool OutputFile::Create(const std::string& path) {
   Discard();
-  struct stat facts;
-  if (lstat(path.c_str(), &facts) == 0 && !S_ISREG(facts.st_mode) && !S_ISLNK(facts.st_mode)) return false;
-  if (path.empty() || FileNameOf(path).empty() || FaultDue()) return false;
-  for (int attempt = 0; attempt < 100 && handle_ < 0; ++attempt) {
-    temporary_ = TemporarySibling(path);
-    handle_ = open(temporary_.c_str(), O_RDWR | O_CREAT | O_EXCL | O_CLOEXEC, 0666);
-    if (handle_ < 0 && errno != EEXIST) return false;
-  }
+  mode_t mode = 0666;
+  bool keepMode = false;
+  if (path.empty() || FileNameOf(path).empty() || !MayBecome(path, mode, keepMode) || FaultDue()) return false;
   path_ = path;
   failed_ = false;
-  return handle_ >= 0;
+  handle_ = OpenUnnamed(FolderOf(path), mode).Release();
+  if (handle_ < 0 && !CreateNamedSibling(mode)) return false;
+  if (keepMode) fchmod(handle_, mode);  // without the user's mask; where that fails it has fewer, never more
+  return true;
+}
+
+bool OutputFile::CreateNamedSibling(unsigned mode) {
+  for (int attempt = 0; attempt < kAttempts; ++attempt) {
+    std::string name = TemporarySibling(path_);
+    const int handle = OpenHandle(name.c_str(), O_RDWR | O_CREAT | O_EXCL | O_NOFOLLOW, mode).Release();
+    if (handle < 0 && errno == EEXIST) continue;
+    if (handle < 0) return false;
+    if (handle_ >= 0) close(handle_);
+    handle_ = handle;
+    temporary_ = std::move(name);
+    listed_ = EnterTemporaryName(temporary_);
+    return true;
+  }
+  return false;
 }
 
 bool OutputFile::Write(std::span<const uint8_t> bytes) {
   if (failed_ || handle_ < 0) return false;
-  if (FaultDue() || !WriteAll(handle_, bytes.data(), bytes.size(), -1)) failed_ = true;
+  failed_ = FaultDue() || !WriteFully(handle_, bytes.data(), bytes.size());
   return !failed_;
 }
 
 bool OutputFile::WriteAt(uint64_t offset, std::span<const uint8_t> bytes) {
   if (failed_ || handle_ < 0) return false;
-  if (FaultDue() || !WriteAll(handle_, bytes.data(), bytes.size(), static_cast<int64_t>(offset))) failed_ = true;
+  failed_ = offset > INT64_MAX - bytes.size() || FaultDue() ||
+            !WriteFully(handle_, bytes.data(), bytes.size(), static_cast<int64_t>(offset));
   return !failed_;
 }
 
 CommitResult OutputFile::Commit(Existing existing, bool sync) {
   if (handle_ < 0) return CommitResult::Failed;
-  const bool replaces = existing == Existing::Replace && access(path_.c_str(), F_OK) == 0;
-  if (replaces || sync) failed_ = failed_ || FaultDue() || fsync(handle_) != 0;
-  failed_ = close(handle_) != 0 || failed_;
-  handle_ = -1;
-  if (failed_ || FaultDue()) {
-    Discard();
-    return CommitResult::Failed;
+  struct stat facts;
+  const bool there = lstat(path_.c_str(), &facts) == 0;
+  const bool replaces = existing == Existing::Replace && there;
+  failed_ = failed_ || (replaces && !S_ISREG(facts.st_mode) && !S_ISLNK(facts.st_mode));
+  bool synced = sync || replaces;
+  if (synced && !failed_) failed_ = FaultDue() || !SyncHandle(handle_);
+  CommitResult result = CommitResult::Failed;
+  if (!failed_ && CloseCopyOf(handle_) && !FaultDue()) result = TakeName(existing, replaces, synced);
+  if (result == CommitResult::Done) temporary_.clear();
+  Discard();
+  if (result == CommitResult::Done && synced) SyncFolderOf(path_);
+  return result;
+}
+
+// Makes the sibling the file. `synced` is set when that turned out to need it.
+CommitResult OutputFile::TakeName(Existing existing, bool replaces, bool& synced) {
+  if (temporary_.empty() && !replaces) {
+    if (NameUnnamed(handle_, path_)) return CommitResult::Done;
+    if (errno == EEXIST && existing == Existing::Refuse) return CommitResult::Taken;
   }
-  int result;
-  if (existing == Existing::Replace) {
-    result = rename(temporary_.c_str(), path_.c_str());
-  } else {
-    result = renameat2(AT_FDCWD, temporary_.c_str(), AT_FDCWD, path_.c_str(), RENAME_NOREPLACE);
-    if (result != 0 && (errno == EINVAL || errno == ENOSYS)) {  // file systems without it: a hard link refuses as well
-      result = link(temporary_.c_str(), path_.c_str());
-      if (result == 0) unlink(temporary_.c_str());
+  if (temporary_.empty() && !NameSibling()) return CommitResult::Failed;
+  if (existing == Existing::Refuse) return RenameRefusing(temporary_, path_);
+  if (!synced && FileExists(path_)) {
+    synced = true;
+    if (FaultDue() || !SyncHandle(handle_)) return CommitResult::Failed;
+  }
+  if (FaultDue()) return CommitResult::Failed;
+  return std::rename(temporary_.c_str(), path_.c_str()) == 0 ? CommitResult::Done : CommitResult::Failed;
+}
+
+// Gives an unnamed sibling a temporary name.
+bool OutputFile::NameSibling() {
+  if (FaultDue()) return false;
+  for (int attempt = 0; attempt < kAttempts; ++attempt) {
+    std::string name = TemporarySibling(path_);
+    if (NameUnnamed(handle_, name)) {
+      temporary_ = std::move(name);
+      listed_ = EnterTemporaryName(temporary_);
+      return true;
     }
+    if (errno != EEXIST) break;
   }
-  if (result != 0) {
-    const bool taken = errno == EEXIST;
-    Discard();
-    return taken ? CommitResult::Taken : CommitResult::Failed;
+  return CopySibling();
+}
+
+// The system made an unnamed file and will not name it: its contents go to one that has a name.
+bool OutputFile::CopySibling() {
+  struct stat facts;
+  if (fstat(handle_, &facts) != 0) return false;
+  const Handle source(fcntl(handle_, F_DUPFD_CLOEXEC, 0));
+  if (!source.IsOpen() || !CreateNamedSibling(facts.st_mode & 0777)) return false;
+  fchmod(handle_, facts.st_mode & 0777);
+  off_t done = 0;
+  while (done < facts.st_size) {
+    const ssize_t count = sendfile(handle_, source.Number(), &done, kCopyStep);
+    if (count < 0 && errno == EINTR) continue;
+    if (count <= 0) return false;
   }
-  temporary_.clear();
-  if (replaces || sync) SyncFolderOf(path_);
-  return CommitResult::Done;
+  return SyncHandle(handle_) && CloseCopyOf(handle_);
 }
 
 void OutputFile::Discard() {
   if (handle_ >= 0) close(handle_);
   handle_ = -1;
+  LeaveTemporaryName(listed_);
+  listed_ = -1;
   if (!temporary_.empty()) unlink(temporary_.c_str());
   temporary_.clear();
 }
