@@ -1,5 +1,6 @@
 #include "cli/commands.h"
 
+#include "cli/config.h"
 #include "cli/formats.h"
 #include "cli/info.h"
 #include "cli/match.h"
@@ -15,6 +16,11 @@ constexpr Command kCommands[] = {
     {"formats", "list the formats and what this build can do with them",       Needs::Formats,  SetUpFormats},
     {"match",   "tell which format a file name selects, without opening it",   Needs::Formats,  SetUpMatch},
     {"verify",  "decode files in full, to find damaged ones",                  Needs::Formats,  SetUpVerify},
+    {"config list",  "list the configuration keys and their values",           Needs::Settings, SetUpConfigList},
+    {"config get",   "print the values of keys",                               Needs::Settings, SetUpConfigGet},
+    {"config set",   "give a key a value",                                     Needs::Settings, SetUpConfigSet},
+    {"config unset", "give a key its default again",                           Needs::Settings, SetUpConfigUnset},
+    {"config path",  "print where the configuration file is",                  Needs::Settings, SetUpConfigPath},
 };
 // clang-format on
 

@@ -8,6 +8,7 @@
 #include "cli/command_parser.h"
 #include "cli/commands.h"
 #include "cli/help.h"
+#include "cli/prepare.h"
 #include "core/nearest_name.h"
 #include "platform/process.h"
 
@@ -95,7 +96,8 @@ int ParseAndRun(const Command* command, const Arguments& arguments, const Io& io
                     command == nullptr ? "" : command->name);
   }
   if (command == nullptr) return Complain(io, "A command is missing.");
-  return context.run();
+  const std::string problem = PrepareFor(*command, context.global);
+  return problem.empty() ? context.run() : Complain(io, problem, command->name);
 }
 
 int Dispatch(Arguments arguments, const Io& io) {

@@ -1,0 +1,23 @@
+#include "cli/prepare.h"
+
+#include <string_view>
+
+#include "core/configuration.h"
+#include "core/data_folder.h"
+
+namespace fotomill::cli {
+
+std::string PrepareFor(const Command& command, const GlobalOptions& global) {
+  if (command.needs == Needs::Nothing) return {};
+  SetDataFolder(global.dataFolder);
+  (void)LoadConfiguration();  // a file that is missing or cannot be read leaves the defaults
+  for (const std::string_view setting : global.settings) {
+    const size_t equals = setting.find('=');
+    if (equals == std::string_view::npos) return "--set takes KEY=VALUE, not \"" + std::string(setting) + "\".";
+    const SetResult result = SetSetting(setting.substr(0, equals), setting.substr(equals + 1));
+    if (!result.Ok()) return "--set: " + result.message;
+  }
+  return {};
+}
+
+}  // namespace fotomill::cli

@@ -1,0 +1,13 @@
+#pragma once
+
+#include <string>
+
+#include "cli/command.h"
+
+namespace fotomill::cli {
+
+// Gets ready what a command needs: the data folder of --data, the configuration, the values of --set on top. Returns what is
+// wrong with the command line, a whole sentence; empty when all is well.
+std::string PrepareFor(const Command& command, const GlobalOptions& global);
+
+}  // namespace fotomill::cli
