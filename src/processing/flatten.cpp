@@ -1,31 +1,40 @@
 #include "processing/flatten.h"
 
 #include <algorithm>
-#include <cassert>
+#include <cstring>
 
+#include "processing/blend.h"
 #include "processing/promote.h"
 
 namespace fotomill {
 
 namespace {
 
-constexpr uint8_t Blend(uint32_t background, uint32_t pixel, uint32_t alpha) {
-  return static_cast<uint8_t>((background * (255 - alpha) + pixel * alpha + 127) / 255);
-}
+constexpr int32_t kAtOnce = 64;  // pixels
 
-void FlattenRow(std::span<uint8_t> row, std::span<const uint8_t> alpha, int32_t width, const uint8_t (&background)[3]) {
-  uint8_t* pixel = row.data();
-  for (int32_t x = 0; x < width; ++x, pixel += 3) {
-    const uint8_t a = alpha[static_cast<size_t>(x)];
-    for (int channel = 0; channel < 3; ++channel) pixel[channel] = Blend(background[channel], pixel[channel], a);
+// The background as often as a block of pixels needs it.
+struct Background {
+  uint8_t bgr[3 * kAtOnce];
+  explicit Background(Color color) {
+    for (int i = 0; i < 3 * kAtOnce; ++i) bgr[i] = static_cast<uint8_t>(color >> (16 - i % 3 * 8));
   }
+};
+
+void BlendBlock(uint8_t* bgr, const uint8_t* alpha, int32_t pixels, const Background& background) {
+  if (std::all_of(alpha, alpha + pixels, [](uint8_t a) { return a == 255; })) return;
+  uint8_t
+      spread[3 * kAtOnce + 1];  // each alpha three times, so that the loop below sees bytes that do not differ in kind
+  for (int32_t i = 0; i < pixels; ++i) {
+    const uint32_t four = alpha[i] * 0x01010101u;
+    std::memcpy(spread + 3 * i, &four, 4);
+  }
+  for (int32_t i = 0; i < 3 * pixels; ++i) bgr[i] = Blend(background.bgr[i], bgr[i], spread[i]);
 }
 
-// Padding is left out: it may hold anything.
 bool IsOpaque(const PackedImage& alpha) {
   for (int32_t r = 0; r < alpha.Height(); ++r) {
     const auto row = alpha.StoredRow(r).first(static_cast<size_t>(alpha.Width()));
-    if (!std::ranges::all_of(row, [](uint8_t a) { return a == 255; })) return false;
+    if (!std::all_of(row.begin(), row.end(), [](uint8_t a) { return a == 255; })) return false;
   }
   return true;
 }
@@ -33,21 +42,25 @@ bool IsOpaque(const PackedImage& alpha) {
 }  // namespace
 
 Status FlattenAlpha(PictureRecord& picture) {
-  if (picture.alpha.Empty() || (picture.alphaFlags & kHasAlpha) == 0) return Status::Ok;
-  assert(picture.alpha.Width() == picture.image.Width() && picture.alpha.Height() == picture.image.Height());
-  const bool ownBackground = (picture.alphaFlags & kFlattenOnBackground) != 0;
-  const Color color = ownBackground ? picture.background : picture.defaultColour;
-  const uint8_t background[3] = {static_cast<uint8_t>(color >> 16), static_cast<uint8_t>(color >> 8),
-                                 static_cast<uint8_t>(color)};  // blue, green, red
-  if (!IsOpaque(picture.alpha)) {
-    RETURN_IF_BAD(PromotePicture(picture));
+  if (picture.alpha.Empty()) return Status::Ok;
+  const bool fromPalette = picture.image.Bits() < 24 && !IsOpaque(picture.alpha);
+  if (fromPalette) RETURN_IF_BAD(PromotePicture(picture));
+  if (picture.image.Bits() == 24) {
+    const bool ownBackground = (picture.alphaFlags & kFlattenOnBackground) != 0;
+    const Background background(ownBackground ? picture.background : picture.defaultColour);
+    const int32_t width = picture.image.Width();
     for (int32_t r = 0; r < picture.image.Height(); ++r) {
-      FlattenRow(picture.image.StoredRow(r), picture.alpha.StoredRow(r), picture.image.Width(), background);
+      uint8_t* bgr = picture.image.StoredRow(r).data();
+      const uint8_t* alpha = picture.alpha.StoredRow(r).data();
+      for (int32_t x = 0; x < width; x += kAtOnce) {
+        BlendBlock(bgr + 3 * static_cast<size_t>(x), alpha + x, std::min(kAtOnce, width - x), background);
+      }
     }
   }
   picture.alpha.Free();
   picture.alphaFlags &= static_cast<uint8_t>(~kHasAlpha);
-  return Status::Ok;
+  bool packed = false;
+  return fromPalette ? PackFewColors(picture, 8, packed) : Status::Ok;
 }
 
 }  // namespace fotomill

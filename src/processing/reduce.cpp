@@ -227,10 +227,8 @@ Status ReduceColors(PictureRecord& picture, int32_t maxBits, const ReduceOptions
   if (picture.image.Empty()) return Status::EmptyImage;
   const int32_t bits = maxBits >= 24 ? 24 : maxBits >= 8 ? 8 : maxBits >= 4 ? 4 : 1;
   if (picture.image.Bits() <= bits) return Status::Ok;
-  if (!picture.alpha.Empty()) {
-    RETURN_IF_BAD(PromotePicture(picture));
-    RETURN_IF_BAD(FlattenAlpha(picture));
-  }
+  RETURN_IF_BAD(FlattenAlpha(picture));
+  if (picture.image.Bits() <= bits) return Status::Ok;
   bool packed = false;
   if (!options.greys) RETURN_IF_BAD(PackFewColors(picture, bits, packed));
   if (packed) return Status::Ok;
