@@ -1,6 +1,7 @@
 #include "cli/commands.h"
 
 #include "cli/config.h"
+#include "cli/exif.h"
 #include "cli/formats.h"
 #include "cli/info.h"
 #include "cli/match.h"
@@ -15,6 +16,7 @@ constexpr Command kCommands[] = {
     {"info",    "tell what files hold, without decoding them",                 Needs::Formats,  SetUpInfo},
     {"formats", "list the formats and what this build can do with them",       Needs::Formats,  SetUpFormats},
     {"match",   "tell which format a file name selects, without opening it",   Needs::Formats,  SetUpMatch},
+    {"exif",    "show the EXIF of pictures, or extract the thumbnail in it",   Needs::Formats,  SetUpExif},
     {"verify",  "decode files in full, to find damaged ones",                  Needs::Formats,  SetUpVerify},
     {"config list",  "list the configuration keys and their values",           Needs::Settings, SetUpConfigList},
     {"config get",   "print the values of keys",                               Needs::Settings, SetUpConfigGet},

@@ -28,7 +28,7 @@ std::string_view ExifTypeLabel(uint16_t type);
 enum class ExifRule : uint8_t {
   Plain,            // by type
   Words,            // an item of the tag's word list
-  Components,       // four bytes, an item of the word list each
+  Components,       // four bytes, 0 where there are fewer, an item of the word list each
   GpsVersion,       // four bytes joined by dots
   Version,          // characters
   Flash,            // five fields of bits

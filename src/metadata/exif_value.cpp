@@ -126,7 +126,7 @@ Text WordText(const ExifValue& value, const ExifWordList& list) {
 }
 
 Text ComponentsText(const ExifValue& value, const ExifWordList& list, std::string& buffer) {
-  if ((!IsOpaque(value) && value.type != kExifByte) || value.count < 4) return {};
+  if ((!IsOpaque(value) && value.type != kExifByte) || value.count == 0) return {};
   for (uint64_t i = 0; i < 4; ++i) buffer += ListItem(list.words, value.bytes.U8(i));
   return buffer;
 }

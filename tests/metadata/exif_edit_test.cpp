@@ -2,7 +2,7 @@
 
 #include <gmock/gmock.h>
 
-#include "metadata/exif_blocks.h"
+#include "support/exif_blocks.h"
 #include "support/hex.h"
 
 namespace fotomill::test {

@@ -6,7 +6,7 @@
 #include <filesystem>
 
 #include "core/limits.h"
-#include "metadata/exif_blocks.h"
+#include "support/exif_blocks.h"
 #include "support/files.h"
 #include "support/hex.h"
 

@@ -124,7 +124,7 @@ const ValueCase kValues[] = {
     {0xa001, S, 1, "FFFF", "Uncalibrated"},
     {0x9101, U, 4, "01 02 03 00", "YCbCr*"},
     {0x9101, U, 4, "04 05 06 07", "RGBUnknown"},
-    {0x9101, U, 3, "01 02 03", kNoLine},
+    {0x9101, U, 3, "01 02 03", "YCbCr*"},
     // rules of their own
     {0x9209, S, 1, "0000", "Fire: N Return: X Mode: U Function: P Redeye: N"},
     {0x9209, S, 1, "005F", "Fire: Y Return: D Mode: A Function: P Redeye: Y"},

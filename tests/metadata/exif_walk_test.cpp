@@ -3,7 +3,7 @@
 #include <gmock/gmock.h>
 
 #include "core/limits.h"
-#include "metadata/exif_blocks.h"
+#include "support/exif_blocks.h"
 
 namespace fotomill::test {
 namespace {

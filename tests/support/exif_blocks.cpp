@@ -1,4 +1,4 @@
-#include "metadata/exif_blocks.h"
+#include "support/exif_blocks.h"
 
 #include "support/hex.h"
 
