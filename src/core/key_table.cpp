@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <array>
 #include <cstring>
+#include <functional>
 
 #include "core/nearest_name.h"
 #include "core/settings.h"
@@ -99,6 +100,13 @@ constinit const KeyTable keyTable = {{
 #undef SETTING
 }, kKeyCount};
 static_assert(offsetof(KeyTable, count) == kKeyCount * sizeof(KeyRow));
+
+size_t NumberOfKey(const KeyRow& row) {
+  const std::less<const KeyRow*> before;
+  const bool original = !before(&row, keyTable.rows) && before(&row, keyTable.rows + kKeyCount);
+  const KeyRow* const found = original ? &row : std::ranges::find(keyTable.rows, row.variable, &KeyRow::variable);
+  return static_cast<size_t>(found - keyTable.rows);
+}
 
 const KeyRow* FindKey(std::string_view name, size_t from) {
   for (size_t step = 0; step < kKeyCount; ++step) {

@@ -64,7 +64,8 @@ extern const KeyTable keyTable;
 
 inline std::span<const KeyRow> Keys() { return keyTable.rows; }
 inline const KeyRow& KeyOf(KeyNumber number) { return keyTable.rows[static_cast<size_t>(number)]; }
-inline size_t NumberOfKey(const KeyRow& row) { return static_cast<size_t>(&row - keyTable.rows); }
+// The place of a row, or of the row that this one is a copy of.
+size_t NumberOfKey(const KeyRow& row);
 
 // The row of that very name, null when there is none. The table has no order to search by. `from` is the row where the
 // search begins; it goes on at the top, so that keys in table order are found at once.
