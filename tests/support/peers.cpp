@@ -7,9 +7,13 @@
 
 namespace fotomill::test {
 
-bool RunShell(const std::string& commandLine) { return std::system(("(" + commandLine + ") 2>/dev/null").c_str()) == 0; }
+bool RunShell(const std::string& commandLine) {
+  return std::system(("(" + commandLine + ") 2>/dev/null").c_str()) == 0;
+}
 
-bool HasProgram(const std::string& name) { return RunShell("command -v " + name + " >/dev/null"); }
+bool HasProgram(const std::string& name) {
+  return RunShell("command -v " + name + " >/dev/null");
+}
 
 PnmPicture ReadPnm(const std::string& path) {
   std::istringstream file(ReadText(path));
@@ -31,9 +35,11 @@ PnmPicture ReadPnm(const std::string& path) {
 }
 
 std::string PnmText(const PnmPicture& picture, bool bitmap) {
-  std::string text = (bitmap ? "P1\n" : "P2\n") + std::to_string(picture.width) + " " + std::to_string(picture.height) + "\n";
+  std::string text =
+      (bitmap ? "P1\n" : "P2\n") + std::to_string(picture.width) + " " + std::to_string(picture.height) + "\n";
   if (!bitmap) text += "255\n";
-  for (size_t i = 0; i < picture.values.size(); ++i) text += std::to_string(picture.values[i]) + (i % 16 == 15 ? "\n" : " ");
+  for (size_t i = 0; i < picture.values.size(); ++i)
+    text += std::to_string(picture.values[i]) + (i % 16 == 15 ? "\n" : " ");
   return text;
 }
 
