@@ -34,13 +34,4 @@ PnmPicture ReadPnm(const std::string& path) {
   return file ? picture : PnmPicture{};
 }
 
-std::string PnmText(const PnmPicture& picture, bool bitmap) {
-  std::string text =
-      (bitmap ? "P1\n" : "P2\n") + std::to_string(picture.width) + " " + std::to_string(picture.height) + "\n";
-  if (!bitmap) text += "255\n";
-  for (size_t i = 0; i < picture.values.size(); ++i)
-    text += std::to_string(picture.values[i]) + (i % 16 == 15 ? "\n" : " ");
-  return text;
-}
-
 }  // namespace fotomill::test

@@ -20,6 +20,5 @@ struct PnmPicture {
 };
 // An empty picture when the file is none of them.
 PnmPicture ReadPnm(const std::string& path);
-std::string PnmText(const PnmPicture& picture, bool bitmap);
 
 }  // namespace fotomill::test
