@@ -2,7 +2,6 @@
 
 #include <gtest/gtest.h>
 
-#include <cstdlib>
 #include <ctime>
 
 #include "platform/clock.h"
@@ -10,6 +9,7 @@
 #include "support/hex.h"
 #include "support/peers.h"
 #include "support/pictures.h"
+#include "support/scoped_environment.h"
 #include "support/scoped_settings.h"
 
 namespace fotomill {
@@ -142,7 +142,7 @@ TEST(Mac, MacBinaryHeaderIsTheSameInEveryTimeZone) {
   const std::string path = folder.Path("MY Photo.MAC");
   for (const char* zone : {"UTC0", "JST-9", "PST8PDT"}) {
     SCOPED_TRACE(zone);
-    setenv("TZ", zone, 1);
+    const ScopedEnvironment timeZone("TZ", zone);
     tzset();
     const PicturePointer picture = MakePicture(8, 720, 1);
     ASSERT_TRUE(picture->fileName.Assign(path));
@@ -162,7 +162,6 @@ TEST(Mac, MacBinaryHeaderIsTheSameInEveryTimeZone) {
     EXPECT_EQ(again->imageBytes, 51840u);
     EXPECT_EQ(again->fileSize, written.size());
   }
-  unsetenv("TZ");
   tzset();
   platform::FixNow(-1);
 }
