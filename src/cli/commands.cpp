@@ -5,6 +5,7 @@
 #include "cli/formats.h"
 #include "cli/info.h"
 #include "cli/match.h"
+#include "cli/plugins.h"
 #include "cli/verify.h"
 
 namespace fotomill::cli {
@@ -17,6 +18,7 @@ constexpr Command kCommands[] = {
     {"formats", "list the formats and what this build can do with them",       Needs::Formats,  SetUpFormats},
     {"match",   "tell which format a file name selects, without opening it",   Needs::Formats,  SetUpMatch},
     {"exif",    "show the EXIF of pictures, or extract the thumbnail in it",   Needs::Formats,  SetUpExif},
+    {"plugins", "list the plug-in formats",                                    Needs::Settings, SetUpPlugins},
     {"verify",  "decode files in full, to find damaged ones",                  Needs::Formats,  SetUpVerify},
     {"config list",  "list the configuration keys and their values",           Needs::Settings, SetUpConfigList},
     {"config get",   "print the values of keys",                               Needs::Settings, SetUpConfigGet},

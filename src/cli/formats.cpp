@@ -47,10 +47,16 @@ std::string RowAsText(int32_t index) {
   return line;
 }
 
+std::string PluginAsText(const PluginFormatFacts& format) {
+  char front[48];
+  std::snprintf(front, sizeof front, "    %-6.6s  read  %-5s  ", format.extension.c_str(), format.canWrite ? "write" : "");
+  return EscapeControls(front) + EscapeControls(PluginDescription(format));
+}
+
 int RunFormats(const FormatsOptions& options, const CommandContext& context) {
   ResultOutput output(context, options.json);
   if (options.destinations) {
-    for (const int32_t index : DestinationRows()) output.Line(LowerCase(FormatRow(index).extension));
+    for (const std::string& extension : DestinationExtensions()) output.Line(extension);
   } else if (options.filter) {
     for (const FilterPair& pair : OpenFileFilter()) output.Line(pair.description + "\t" + pair.patterns);
   } else {
@@ -60,6 +66,9 @@ int RunFormats(const FormatsOptions& options, const CommandContext& context) {
       } else if ((FormatRow(index).flags & FMT_SPARE) == 0) {
         output.Line(RowAsText(index));
       }
+    }
+    for (const PluginFormatFacts& format : PluginFormats()) {
+      if (!output.IsJson()) output.Line(PluginAsText(format));
     }
   }
   return kExitOk;

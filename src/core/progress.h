@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <string_view>
 
 namespace fotomill {
 
@@ -12,6 +13,8 @@ class ProgressSink {
   // `done` of `total` steps, usually rows, are finished.
   virtual void Step(int32_t done, int32_t total) = 0;
   virtual void End() {}
+  // A text of the operation's own, shown in place of the status line.
+  virtual void SetText(std::string_view) {}
 };
 
 }  // namespace fotomill

@@ -232,7 +232,8 @@ constexpr std::array<FormatEntry, formatCount> MakeRows() {
 }
 
 constinit std::array<FormatEntry, formatCount> formatRows = MakeRows();
-PluginFallback pluginFallback = nullptr;
+constinit thread_local FormatEntry spareRow = MakeRows()[kSpareRow];
+const PluginSource* pluginSource = nullptr;
 
 // A row matches an extension that equals its own, or that shares its first three characters; a shorter one must match
 // to its end.
@@ -243,7 +244,7 @@ bool RowMatches(std::string_view rowExtension, std::string_view extension) {
 
 }  // namespace
 
-FormatEntry& FormatRow(int32_t index) { return formatRows[static_cast<size_t>(index)]; }
+FormatEntry& FormatRow(int32_t index) { return index == kSpareRow ? spareRow : formatRows[static_cast<size_t>(index)]; }
 
 int32_t FindFormatByName(std::string_view fileName, int32_t parameter) {
   const std::string_view extension = platform::ExtensionOf(fileName);
@@ -256,10 +257,18 @@ int32_t FindFormatByName(std::string_view fileName, int32_t parameter) {
   return FindPluginFormat(fileName, parameter);
 }
 
-void InstallPluginFallback(PluginFallback fallback) { pluginFallback = fallback; }
+void InstallPluginSource(const PluginSource* source) { pluginSource = source; }
 
 int32_t FindPluginFormat(std::string_view fileName, int32_t parameter) {
-  return pluginFallback == nullptr ? kNoFormat : pluginFallback(fileName, parameter);
+  return pluginSource == nullptr ? kNoFormat : pluginSource->bind(fileName, parameter);
+}
+
+std::vector<PluginFormatFacts> PluginFormats() {
+  return pluginSource == nullptr ? std::vector<PluginFormatFacts>{} : pluginSource->list();
+}
+
+std::string PluginDescription(const PluginFormatFacts& format) {
+  return "(" + format.extension + ") Plugin" + (format.textB.empty() ? "" : " " + format.textB);
 }
 
 bool CanRead(const FormatEntry& row) {
@@ -313,6 +322,10 @@ std::vector<FilterPair> OpenFileFilter() {
     pairs.push_back({std::string(row.description.view()), pattern});
     pairs[0].patterns += (pairs[0].patterns.empty() ? "" : ";") + pattern;
   }
+  for (const PluginFormatFacts& format : PluginFormats()) {
+    pairs.push_back({PluginDescription(format), "*." + format.extension});
+    pairs[0].patterns += ";*." + format.extension;
+  }
   return pairs;
 }
 
@@ -324,6 +337,15 @@ std::vector<int32_t> DestinationRows() {
     if ((flags & FMT_SAVE_ANYWAY) != 0 || (flags & kExcluded) == 0) rows.push_back(i);
   }
   return rows;
+}
+
+std::vector<std::string> DestinationExtensions() {
+  std::vector<std::string> extensions;
+  for (const int32_t index : DestinationRows()) extensions.push_back(LowerCase(FormatRow(index).extension.view()));
+  for (const PluginFormatFacts& format : PluginFormats()) {
+    if (format.canWrite) extensions.push_back(LowerCase(format.extension));
+  }
+  return extensions;
 }
 
 std::vector<int32_t> FormatListRows() {

@@ -68,6 +68,7 @@ inline constexpr int32_t kSpareRow = 77;
 inline constexpr int32_t formatCount = 78;
 
 // Row `index` of the registry; the rows live as long as the program. Only `enabled`, `options` and the spare row change.
+// Every thread has a spare row of its own, so that files of different plug-in formats can be in work at once.
 FormatEntry& FormatRow(int32_t index);
 
 // The row that a file name selects by its extension, or kNoFormat. The first row wins whose extension equals the
@@ -75,11 +76,25 @@ FormatEntry& FormatRow(int32_t index);
 // are disabled ones with `AllowPluginFormatOverride`. Where no row matches, the plug-ins are asked.
 int32_t FindFormatByName(std::string_view fileName, int32_t parameter = 0);
 
-// The plug-in fallback of FindFormatByName: binds the plug-in format of that extension to the spare row and returns its
-// index, or kNoFormat. Installed by the plug-in loader; without it nothing matches.
-using PluginFallback = int32_t (*)(std::string_view fileName, int32_t parameter);
-void InstallPluginFallback(PluginFallback fallback);
+// What the registry asks the plug-in loader for. Without one no plug-in format exists.
+struct PluginFormatFacts {
+  std::string extension;  // upper case, without the dot
+  std::string textB;      // the module's description of its formats
+  uint32_t maxBits = 0;   // deepest picture that it writes
+  bool canWrite = false;
+};
+struct PluginSource {
+  // Binds the format of a file's extension to this thread's spare row; its index, or kNoFormat.
+  int32_t (*bind)(std::string_view fileName, int32_t parameter);
+  // The formats of all modules, sorted.
+  std::vector<PluginFormatFacts> (*list)();
+};
+void InstallPluginSource(const PluginSource* source);  // not owned; null removes it
+// The plug-in fallback of FindFormatByName.
 int32_t FindPluginFormat(std::string_view fileName, int32_t parameter = 0);
+std::vector<PluginFormatFacts> PluginFormats();
+// How lists show a plug-in format: "(EXT) Plugin", followed by a blank and the module's text when it has one.
+std::string PluginDescription(const PluginFormatFacts& format);
 
 // Whether a row's operations do their work in this build.
 bool CanRead(const FormatEntry& row);
@@ -120,10 +135,12 @@ struct FilterPair {
   std::string description;
   std::string patterns;
 };
-// All pictures first, then one pair per row that can be opened, in row order.
+// All pictures first, then one pair per row that can be opened, in row order, then the plug-in formats.
 std::vector<FilterPair> OpenFileFilter();
 // Rows in which pictures can be saved, as offered to the user, in row order: indices.
 std::vector<int32_t> DestinationRows();
+// The same as the user sees them: extensions in lower case, followed by those of plug-in formats that can be written.
+std::vector<std::string> DestinationExtensions();
 // The rows of the format list, in which the user switches formats on and off: indices.
 std::vector<int32_t> FormatListRows();
 // The rows of other lists to choose a format from, shown by their descriptions: those switched on.

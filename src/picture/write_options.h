@@ -15,10 +15,10 @@ struct WriteOptions {
   std::string password;      // for formats that can be protected; empty: none
 };
 
-// Commits a writer's file as the options say: Ok; ErrorWritingFile when a write failed; ErrorCreatingFile when the name
-// was taken meanwhile and must not be replaced.
-inline Status CommitOutput(ByteWriter& out, const WriteOptions& options) {
-  switch (out.Commit(options.existing)) {
+// The status that a commit's outcome means: ErrorWritingFile when a write failed, ErrorCreatingFile when the name was taken
+// meanwhile and must not be replaced.
+constexpr Status CommitStatus(platform::CommitResult result) {
+  switch (result) {
     case platform::CommitResult::Done:
       return Status::Ok;
     case platform::CommitResult::Taken:
@@ -28,5 +28,8 @@ inline Status CommitOutput(ByteWriter& out, const WriteOptions& options) {
   }
   return Status::ErrorWritingFile;
 }
+
+// Commits a writer's file as the options say; statuses as above.
+inline Status CommitOutput(ByteWriter& out, const WriteOptions& options) { return CommitStatus(out.Commit(options.existing)); }
 
 }  // namespace fotomill

@@ -1,0 +1,219 @@
+#include "plugins/plugin_bridge.h"
+
+#include <algorithm>
+#include <cstddef>
+#include <mutex>
+#include <string>
+#include <vector>
+
+#include "core/key_table.h"
+#include "core/settings.h"
+#include "picture/registry.h"
+#include "platform/file_view.h"
+#include "platform/files.h"
+#include "platform/module_memory.h"
+#include "platform/paths.h"
+#include "platform/temporary_file.h"
+#include "plugins/plugin_bitmap.h"
+#include "plugins/plugin_table.h"
+
+namespace fotomill {
+
+namespace {
+
+// Modules need not be re-entrant: one call at a time.
+std::recursive_mutex& CallMutex() {  // recursive: a module may load pictures through the program
+  static std::recursive_mutex mutex;
+  return mutex;
+}
+
+// The picture whose call is running on this thread; the progress entries have no argument that could tell.
+thread_local PictureRecord* currentPicture = nullptr;
+
+FMW_HANDLE FMW_CALL HostLoadPicture(const char* fileName, int32_t* error) {
+  PicturePointer picture;
+  Status status = fileName == nullptr ? Status::FileOpenError : LoadPicture(fileName, picture);
+  void* block = status == Status::Ok ? platform::NewModuleBlock(picture->image.Bytes()) : nullptr;
+  if (status == Status::Ok && block == nullptr) status = Status::MemoryAllocationError;
+  if (error != nullptr) *error = StatusNumber(status);
+  return block;
+}
+void FMW_CALL HostFreePicture(FMW_HANDLE bitmap) { platform::FreeModuleBlock(bitmap); }
+ProgressSink* CurrentProgress() { return currentPicture == nullptr ? nullptr : currentPicture->progress; }
+void FMW_CALL HostProgressBegin() {
+  if (ProgressSink* progress = CurrentProgress()) progress->Begin();
+}
+void FMW_CALL HostProgressStep(int32_t done, int32_t total) {
+  if (ProgressSink* progress = CurrentProgress()) progress->Step(done, total);
+}
+void FMW_CALL HostProgressEnd() {
+  if (ProgressSink* progress = CurrentProgress()) progress->End();
+}
+void FMW_CALL HostSetStatus(const char* text) {
+  if (ProgressSink* progress = CurrentProgress(); progress != nullptr && text != nullptr) progress->SetText(text);
+}
+
+// The key table as modules see it. Its rows have that very layout.
+const FMW_CONFIG_ENTRY* ConfigurationTable() {
+  static_assert(sizeof(FMW_CONFIG_ENTRY) == sizeof(KeyRow) && offsetof(FMW_CONFIG_ENTRY, type) == offsetof(KeyRow, type) &&
+                offsetof(FMW_CONFIG_ENTRY, extra) == offsetof(KeyRow, extra));
+  return static_cast<const FMW_CONFIG_ENTRY*>(static_cast<const void*>(keyTable.rows));
+}
+
+// One call into a module: holds the mutex, names the picture, and carries the service block.
+class ModuleCall {
+ public:
+  explicit ModuleCall(PictureRecord& picture) : lock_(CallMutex()), before_(currentPicture) {
+    currentPicture = &picture;
+    services_.size = sizeof services_;
+    services_.version = FMW_PLUGIN_VERSION;
+    std::copy_n("RXaR", 4, services_.mark);
+    services_.loadPicture = HostLoadPicture;
+    services_.freePicture = HostFreePicture;
+    services_.progressBegin = HostProgressBegin;
+    services_.progressStep = HostProgressStep;
+    services_.progressEnd = HostProgressEnd;
+    services_.setStatus = HostSetStatus;
+    services_.configuration = ConfigurationTable();
+    services_.configurationCount = static_cast<int32_t>(keyTable.count);
+  }
+  ~ModuleCall() { currentPicture = before_; }
+  ModuleCall(const ModuleCall&) = delete;
+  ModuleCall& operator=(const ModuleCall&) = delete;
+  FMW_HOST_SERVICES* Services() { return &services_; }
+
+ private:
+  std::lock_guard<std::recursive_mutex> lock_;
+  PictureRecord* before_;
+  FMW_HOST_SERVICES services_ = {};
+};
+
+// A module's error number as a status. A module that fails without a number has at least not succeeded.
+Status ModuleError(int32_t error) { return error == 0 ? Status::DamagedFile : static_cast<Status>(error); }
+
+std::string CommentText(const PictureRecord& picture) { return {picture.comment.begin(), picture.comment.end()}; }
+
+Status TakeInfo(const FMW_PICTURE_INFO& info, PictureRecord& picture) {
+  const bool depthFits = (info.bitsPerPixel >= 1 && info.bitsPerPixel <= 8) || info.bitsPerPixel == 16 ||
+                         info.bitsPerPixel == 24 || info.bitsPerPixel == 32;
+  if (info.width < 1 || info.height < 1 || !depthFits) return Status::DamagedFile;
+  picture.width = info.width;
+  picture.height = info.height;
+  picture.bitsPerPixel = info.bitsPerPixel > 8 ? 24 : info.bitsPerPixel;
+  if (info.bitsPerPixel > 24) picture.alphaFlags |= kHasAlpha;
+  picture.pageCount = std::clamp(info.frame, 1, 1 << 20);
+  picture.metadata.dpiX = std::clamp(info.dpiX, 0, 1 << 20);
+  picture.metadata.dpiY = std::clamp(info.dpiY, 0, 1 << 20);
+  picture.imageBytes = info.imageBytes > 0 ? static_cast<uint64_t>(info.imageBytes)
+                                           : EstimateImageBytes(info.width, info.height, picture.bitsPerPixel);
+  picture.background = static_cast<Color>(info.background) & 0xffffff;
+  std::copy(std::begin(info.palette), std::end(info.palette), picture.palette.begin());
+  picture.typeName.Clear();
+  if (info.version >= FMW_PLUGIN_VERSION) picture.typeName.AssignCut({info.typeName, sizeof info.typeName - 1});
+  return Status::Ok;
+}
+
+// Lets the module write the picture to `path`.
+Status CallWriter(const PluginEntry& entry, PictureRecord& picture, const std::string& path) {
+  const std::string comment = settings.WriteFileComments != 0 ? CommentText(picture) : std::string();
+  void* bitmap = NewModuleBitmap(picture.image, picture.alpha);
+  if (bitmap == nullptr) return Status::MemoryAllocationError;
+  int32_t error = 0;
+  ModuleCall call(picture);
+  const int32_t written = entry.exports.writeImage(path.c_str(), bitmap, comment.empty() ? nullptr : comment.c_str(),
+                                                   &error, call.Services());
+  platform::FreeModuleBlock(bitmap);
+  if (written != 0) return Status::Ok;
+  return error == 0 ? Status::ErrorWritingFile : static_cast<Status>(error);
+}
+
+}  // namespace
+
+Status PluginInfo(PictureRecord& picture, const char* fileName, uint32_t) {
+  const PluginEntry* entry = FindPluginEntry(fileName);
+  if (entry == nullptr || entry->exports.getInfo == nullptr) return Status::UnsupportedFunction;
+  FMW_PICTURE_INFO info = {};
+  info.size = sizeof info;
+  info.version = FMW_PLUGIN_VERSION;
+  info.frame = picture.page;
+  int32_t error = 0;
+  ModuleCall call(picture);
+  if (entry->exports.getInfo(&info, fileName, &error, call.Services()) == 0) return ModuleError(error);
+  picture.fileSize = platform::FactsOf(fileName).size;
+  return TakeInfo(info, picture);
+}
+
+Status PluginRead(PictureRecord& picture, const char* fileName) {
+  const PluginEntry* entry = FindPluginEntry(fileName);
+  if (entry == nullptr || entry->exports.readImage == nullptr) return Status::UnsupportedFunction;
+  RETURN_IF_BAD(PluginComment(picture, fileName));
+  const std::string comment = CommentText(picture);
+  int32_t error = 0;
+  ModuleCall call(picture);
+  call.Services()->comment = comment.empty() ? nullptr : comment.c_str();
+  void* handle = entry->exports.readImage(fileName, &error, call.Services());
+  if (handle == nullptr) return ModuleError(error);
+  const auto block = platform::LockModuleBlock(handle);
+  Status status = Status::MemoryAllocationError;
+  if (!block.empty()) {
+    status = TakeModuleBitmap(block, picture.image, picture.alpha, picture.palette);
+    platform::UnlockModuleBlock(handle);
+  }
+  platform::FreeModuleBlock(handle);
+  RETURN_IF_BAD(status);
+  picture.width = picture.image.Width();
+  picture.height = picture.image.Height();
+  picture.bitsPerPixel = picture.image.Bits();
+  return Status::Ok;
+}
+
+Status PluginWrite(PictureRecord& picture, const WriteOptions& options) {
+  const PluginEntry* entry = FindPluginEntry(picture.fileName);
+  if (entry == nullptr || entry->exports.writeImage == nullptr) return Status::UnsupportedFunction;
+  const std::string destination(picture.fileName.view());
+  ByteWriter out;
+  platform::TemporaryFile working;  // of the same extension: a module may decide by it
+  if (!out.Create(destination)) return Status::ErrorCreatingFile;
+  if (!working.Create(platform::SplitPath(destination).extension)) return Status::ErrorCreatingFile;
+  RETURN_IF_BAD(CallWriter(*entry, picture, working.Path()));
+  platform::FileView written;
+  if (!written.Open(working.Path())) return Status::ErrorWritingFile;
+  out.Bytes(written.Bytes());
+  return written.Intact() ? CommitOutput(out, options) : Status::ErrorWritingFile;
+}
+
+Status PluginComment(PictureRecord& picture, const char* fileName) {
+  const PluginEntry* entry = FindPluginEntry(fileName);
+  if (entry == nullptr) return Status::UnsupportedFunction;
+  if (entry->exports.getComment == nullptr) return Status::Ok;
+  int32_t error = 0;
+  ModuleCall call(picture);
+  void* handle = entry->exports.getComment(fileName, &error, 0);
+  if (handle == nullptr) return Status::Ok;
+  const auto block = platform::LockModuleBlock(handle);
+  if (!block.empty()) {
+    picture.comment.assign(block.begin(), std::find(block.begin(), block.end(), uint8_t{0}));
+    platform::UnlockModuleBlock(handle);
+  }
+  platform::FreeModuleBlock(handle);
+  return block.empty() ? Status::MemoryAllocationError : Status::Ok;
+}
+
+int32_t BindPluginFormat(std::string_view fileName) {
+  const PluginEntry* entry = FindPluginEntry(fileName);
+  if (entry == nullptr) return kNoFormat;
+  FormatEntry& row = FormatRow(kSpareRow);
+  row.details = nullptr;
+  row.info = PluginInfo;
+  row.read = PluginRead;
+  row.write = PluginWrite;
+  row.reserved = 0;
+  row.maxBits = entry->flags1;
+  row.extension = entry->extension;
+  row.description = entry->textB;
+  row.enabled = 1;
+  row.flags = entry->flags2;
+  return kSpareRow;
+}
+
+}  // namespace fotomill

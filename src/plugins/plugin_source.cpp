@@ -1,0 +1,52 @@
+// Joins the plug-in table to the registry: modules are loaded the first time that the registry asks.
+
+#include <mutex>
+
+#include "core/settings.h"
+#include "core/text.h"
+#include "picture/registry.h"
+#include "plugins/plugin_bridge.h"
+#include "plugins/plugin_table.h"
+
+namespace fotomill {
+
+namespace {
+
+std::mutex scanMutex;
+bool scanned = false;
+std::string pluginFolder;
+
+void ScanOnce() {
+  const std::lock_guard lock(scanMutex);
+  if (!scanned) (void)ScanPlugins(pluginFolder);
+  scanned = true;
+}
+
+int32_t BindForRegistry(std::string_view fileName, int32_t) {
+  ScanOnce();
+  return BindPluginFormat(fileName);
+}
+
+std::vector<PluginFormatFacts> ListForRegistry() {
+  ScanOnce();
+  std::vector<PluginFormatFacts> formats;
+  for (int32_t i = 0; i < PluginFormatCount(); ++i) {
+    const PluginEntry& entry = PluginRow(i);
+    formats.push_back({UpperCase(entry.extension.view()), std::string(entry.textB.view()), entry.flags1,
+                       entry.exports.writeImage != nullptr});
+  }
+  return formats;
+}
+
+constexpr PluginSource kPluginSource = {BindForRegistry, ListForRegistry};
+
+}  // namespace
+
+void EnablePlugins(const std::string& folder) {
+  const std::lock_guard lock(scanMutex);
+  scanned = false;
+  pluginFolder = folder;
+  InstallPluginSource(&kPluginSource);
+}
+
+}  // namespace fotomill

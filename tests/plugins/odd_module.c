@@ -1,0 +1,95 @@
+/*
+ * A module that misbehaves in one way, chosen by a macro at build time; everything else about it is in order. Its
+ * pictures are 2 x 1 of 24 bits, blue and red, whatever the file holds.
+ */
+#include <stdio.h>
+#include <stdlib.h>
+#include <string.h>
+
+#include "fotomill_plugin.h"
+
+FMW_EXPORT int32_t FMW_CALL PLUGIN11GetPluginParams(FMW_PLUGIN_PARAMS* params, int32_t zero) {
+  (void)zero;
+#if defined(REFUSES)
+  return 0;
+#endif
+  strcpy(params->textA, "Odd");
+  strcpy(params->textB, "of tests");
+  strcpy(params->extensions, "odd");
+  params->flags1 = 24;
+  params->flags2 = FMW_FORMAT_BITMAP;
+#if defined(GAPS_IN_LIST)
+  strcpy(params->extensions, "abc;;def");
+  params->flags2 |= FMW_FORMAT_MULTI;
+#elif defined(FORTY_FORMATS)
+  params->extensions[0] = 0;
+  for (int i = 0; i < 40; ++i) {
+    const char name[] = {'f', (char)('a' + i / 10), (char)('0' + i % 10), ';', 0};
+    strcat(params->extensions, name);
+  }
+#elif defined(UNTERMINATED_TEXTS)
+  memset(params->textA, 'A', sizeof params->textA);
+  memset(params->textB, 'B', sizeof params->textB);
+  memset(params->extensions + 3, ';', sizeof params->extensions - 3);
+#endif
+  return 1;
+}
+
+#if !defined(NO_INFO_EXPORT)
+FMW_EXPORT int32_t FMW_CALL PLUGIN11GetInfo(FMW_PICTURE_INFO* info, const char* fileName, int32_t* error,
+                                            const FMW_HOST_SERVICES* services) {
+  (void)fileName;
+  info->width = 2;
+  info->height = 1;
+  info->bitsPerPixel = 24;
+  memset(info->typeName, 'T', sizeof info->typeName);
+#if defined(GARBAGE_SIZES)
+  info->width = -2147483647;
+  info->bitsPerPixel = 999;
+#elif defined(ERROR_NUMBER)
+  *error = 25;
+  return 0;
+#endif
+  (void)error;
+  return services->size == (int32_t)sizeof *services && memcmp(services->mark, "RXaR", 4) == 0 &&
+         strcmp(services->configuration[0].name, "AllowDestinationOverrides") == 0;
+}
+#endif
+
+FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN11ReadImage(const char* fileName, int32_t* error,
+                                                 const FMW_HOST_SERVICES* services) {
+  static const uint8_t rowBytes[] = {255, 0, 0, 0, 0, 255, 0, 0};
+  uint8_t* block = calloc(1, 48);
+  (void)fileName;
+  (void)error;
+  (void)services;
+  block[0] = 40;
+  block[4] = 2;
+  block[8] = 1;
+  block[12] = 1;
+  block[14] = 24;
+  memcpy(block + 40, rowBytes, 8);
+#if defined(SMALL_BLOCK)
+  block[6] = 1; /* 65538 pixels wide, in 48 bytes */
+#elif defined(WRONG_DEPTH)
+  block[14] = 7;
+#elif defined(EMPTY_RESULT)
+  free(block);
+  return 0;
+#endif
+  return block;
+}
+
+#if defined(HALF_WRITER)
+FMW_EXPORT int32_t FMW_CALL PLUGIN11WriteImage(const char* fileName, FMW_HANDLE bitmap, const char* comment,
+                                               int32_t* error, const FMW_HOST_SERVICES* services) {
+  FILE* file = fopen(fileName, "wb");
+  (void)bitmap;
+  (void)comment;
+  (void)services;
+  fputs("half", file);
+  fclose(file);
+  *error = 11;
+  return 0;
+}
+#endif

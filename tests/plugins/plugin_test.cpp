@@ -1,0 +1,179 @@
+#include <gtest/gtest.h>
+
+#include <filesystem>
+
+#include "core/settings.h"
+#include "picture/registry.h"
+#include "plugins/plugin_bridge.h"
+#include "plugins/plugin_table.h"
+#include "support/files.h"
+#include "support/scoped_settings.h"
+
+namespace fotomill {
+namespace {
+
+std::string OddFolder(const std::string& name) { return std::string(ODD_MODULES) + "/" + name; }
+
+class Plugins : public testing::Test {
+ protected:
+  ~Plugins() override {
+    InstallPluginSource(nullptr);
+    UnloadPlugins();
+  }
+  test::TemporaryFolder folder_;
+  test::ScopedSettings settings_;
+};
+
+TEST_F(Plugins, ModulesAreRegisteredOrSkipped) {
+  struct Row {
+    const char* module;
+    std::vector<std::string> extensions;
+  };
+  const Row rows[] = {
+      {"REFUSES", {}},
+      {"NO_INFO_EXPORT", {}},
+      {"GAPS_IN_LIST", {"abc", "def"}},
+      {"UNTERMINATED_TEXTS", {"odd"}},
+      {"missing folder", {}},
+  };
+  for (const Row& row : rows) {
+    SCOPED_TRACE(row.module);
+    ASSERT_EQ(ScanPlugins(OddFolder(row.module)), static_cast<int32_t>(row.extensions.size()));
+    for (size_t i = 0; i < row.extensions.size(); ++i) {
+      EXPECT_EQ(PluginRow(static_cast<int32_t>(i)).extension.view(), row.extensions[i]);
+    }
+  }
+  EXPECT_EQ(ScanPlugins(OddFolder("FORTY_FORMATS")), kFormatsPerModule);
+}
+
+TEST_F(Plugins, TextsWithoutEndAreCut) {
+  ASSERT_EQ(ScanPlugins(OddFolder("UNTERMINATED_TEXTS")), 1);
+  std::string a, b;
+  ASSERT_TRUE(PluginTextA(0, a));
+  ASSERT_TRUE(PluginTextB(0, b));
+  EXPECT_EQ(a, std::string(260, 'A'));
+  EXPECT_EQ(b, std::string(260, 'B'));
+  EXPECT_FALSE(PluginTextA(1, a));
+}
+
+TEST_F(Plugins, OnlyModulesByNameAreLoaded) {
+  const std::string module = OddFolder("GAPS_IN_LIST") + "/FMWPL_odd.so";
+  for (const char* name : {"FMWPL_odd_x64.so", ".FMWPL_odd.so", "odd.so", "FMWPL.so.1", "FMWPL_link.txt"}) {
+    std::filesystem::copy_file(module, folder_.Path(name));
+  }
+  EXPECT_EQ(ScanPlugins(folder_.Path()), 0);
+  std::filesystem::copy_file(module, folder_.Path("FMWPLtwin.so"));
+  std::filesystem::copy_file(module, folder_.Path("FMWPL_odd.so"));
+  ASSERT_EQ(ScanPlugins(folder_.Path()), 4);
+  EXPECT_EQ(PluginRow(0).extension.view(), "abc");
+  EXPECT_EQ(PluginRow(1).extension.view(), "abc");
+  EXPECT_LT(PluginRow(0).path.view(), PluginRow(1).path.view());
+  EXPECT_TRUE(PluginCanHandle("x.ABC"));
+  EXPECT_FALSE(PluginCanHandle("x.xyz"));
+}
+
+TEST_F(Plugins, WhatAModuleReturnsIsChecked) {
+  struct Row {
+    const char* module;
+    Status status;
+  };
+  const Row rows[] = {
+      {"GARBAGE_SIZES", Status::DamagedFile},  {"ERROR_NUMBER", Status::InvalidPassword},
+      {"SMALL_BLOCK", Status::DamagedFile},    {"WRONG_DEPTH", Status::UnsupportedFormat},
+      {"EMPTY_RESULT", Status::DamagedFile},   {"HALF_WRITER", Status::Ok},
+  };
+  const std::string file = folder_.Path("x.odd");
+  test::WriteText(file, "anything");
+  for (const Row& row : rows) {
+    SCOPED_TRACE(row.module);
+    EnablePlugins(OddFolder(row.module));
+    PicturePointer picture;
+    EXPECT_EQ(LoadPicture(file.c_str(), picture), row.status);
+    EXPECT_EQ(picture != nullptr, row.status == Status::Ok);
+  }
+}
+
+TEST_F(Plugins, AFailedWriteLeavesTheDestinationAlone) {
+  EnablePlugins(OddFolder("HALF_WRITER"));
+  const std::string file = folder_.Path("x.odd");
+  test::WriteText(file, "before");
+  PicturePointer picture;
+  ASSERT_EQ(LoadPicture(file.c_str(), picture), Status::Ok);
+  EXPECT_EQ(picture->typeName.view(), std::string(64, 'T'));
+  EXPECT_EQ(picture->image.PixelAt(0, 0), 0x0000ff);
+  EXPECT_EQ(picture->image.PixelAt(1, 0), 0xff0000);
+  EXPECT_EQ(WritePicture(*picture, file, {}), Status::ErrorWritingFile);
+  EXPECT_EQ(test::ReadText(file), "before");
+  EXPECT_EQ(folder_.Names(), std::vector<std::string>{"x.odd"});
+}
+
+TEST_F(Plugins, AModuleWithoutWriterIsReadOnly) {
+  EnablePlugins(OddFolder("GAPS_IN_LIST"));
+  test::WriteText(folder_.Path("x.abc"), "");
+  PicturePointer picture;
+  ASSERT_EQ(LoadPicture(folder_.Path("x.abc").c_str(), picture), Status::Ok);
+  EXPECT_EQ(WritePicture(*picture, folder_.Path("y.def"), {}), Status::UnsupportedFunction);
+  for (const std::string& extension : DestinationExtensions()) EXPECT_NE(extension, "def");
+}
+
+TEST_F(Plugins, SampleModuleReadsEveryKind) {
+  EnablePlugins(SAMPLE_MODULES);
+  struct Row {
+    const char* name;
+    const char* contents;
+    int32_t bits;
+    std::vector<int32_t> pixels;  // indices, or 0x00RRGGBB
+  };
+  const Row rows[] = {
+      {"plain.pbm", "P1\n# a remark\n3 1\n1 0 1\n", 1, {0, 1, 0}},
+      {"raw.pgm", "P5 2 1 255\n\x10\xf0", 8, {0x10, 0xf0}},
+      {"deep.pgm", "P2 2 1 1000 0 1000", 8, {0, 255}},
+      {"raw.ppm", "P6\n2 1\n255\n\x01\x02\x03\xff\xfe\xfd", 24, {0x010203, 0xfffefd}},
+  };
+  for (const Row& row : rows) {
+    SCOPED_TRACE(row.name);
+    test::WriteText(folder_.Path(row.name), row.contents);
+    PicturePointer picture;
+    ASSERT_EQ(LoadPicture(folder_.Path(row.name).c_str(), picture), Status::Ok);
+    EXPECT_EQ(picture->bitsPerPixel, row.bits);
+    for (size_t x = 0; x < row.pixels.size(); ++x) {
+      EXPECT_EQ(picture->image.PixelAt(static_cast<int32_t>(x), 0), row.pixels[x]) << "column " << x;
+    }
+  }
+  PicturePointer picture;
+  test::WriteText(folder_.Path("short.ppm"), "P6 9 9 255\nabc");
+  EXPECT_EQ(LoadPicture(folder_.Path("short.ppm").c_str(), picture), Status::FileReadError);
+  test::WriteText(folder_.Path("huge.ppm"), "P6 99999999 99999999 255\n");
+  EXPECT_EQ(LoadPicture(folder_.Path("huge.ppm").c_str(), picture), Status::MemoryAllocationError);
+}
+
+TEST_F(Plugins, OnePluginFormatConvertsToAnother) {
+  EnablePlugins(SAMPLE_MODULES);
+  test::WriteText(folder_.Path("a.ppm"), "P6\n# kept\n2 1\n255\n\x01\x02\x03\xff\xfe\xfd");
+  PicturePointer picture;
+  ASSERT_EQ(LoadPicture(folder_.Path("a.ppm").c_str(), picture), Status::Ok);
+  EXPECT_EQ(picture->formatIndex, kSpareRow);
+  EXPECT_EQ(std::string(picture->comment.begin(), picture->comment.end()), "kept");
+  settings.WriteFileComments = 1;
+  ASSERT_EQ(WritePicture(*picture, folder_.Path("b.PGM"), {}), Status::Ok);
+  EXPECT_EQ(test::ReadText(folder_.Path("b.PGM")), "P5\n# kept\n2 1\n255\n\x02\xfe");
+  settings.WriteFileComments = 0;
+  ASSERT_EQ(WritePicture(*picture, folder_.Path("c.ppm"), {}), Status::Ok);
+  EXPECT_EQ(test::ReadText(folder_.Path("c.ppm")), "P6\n2 1\n255\n\x01\x02\x03\xff\xfe\xfd");
+}
+
+TEST_F(Plugins, ListsShowPluginFormatsBehindTheRows) {
+  EnablePlugins(SAMPLE_MODULES);
+  const auto filter = OpenFileFilter();
+  EXPECT_EQ(filter.back().description, "(PPM) Plugin Portable anymap");
+  EXPECT_EQ(filter.back().patterns, "*.PPM");
+  EXPECT_EQ(DestinationExtensions().back(), "ppm");
+  EXPECT_EQ(FindFormatByName("x.Pgm"), kSpareRow);
+  EXPECT_EQ(FormatRow(kSpareRow).extension.view(), "pgm");
+  EXPECT_EQ(FindFormatByName("x.ppm"), kSpareRow);
+  EXPECT_EQ(FormatRow(kSpareRow).extension.view(), "ppm");
+  EXPECT_TRUE((FormatRow(kSpareRow).flags & FMT_SPARE) != 0);
+}
+
+}  // namespace
+}  // namespace fotomill
