@@ -6,13 +6,14 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <atomic>
-#include <cerrno>
 #include <cstring>
 #include <mutex>
 #include <utility>
 
 #include "platform/fault.h"
+#include "platform/posix/handle.h"
 
 namespace fotomill::platform {
 
@@ -25,36 +26,42 @@ constexpr size_t kMostMappings = 256;
 // The mapped views. A mapping whose file was cut short raises SIGBUS when the lost part is touched; the handler puts
 // zero pages there and marks the view, so that one file cannot take the program down. Slots are only ever reused.
 struct MappedRange {
-  std::atomic<uintptr_t> begin{0};
-  std::atomic<uintptr_t> end{0};
+  std::atomic<uintptr_t> begin{0};  // 0: the slot is free
+  std::atomic<uintptr_t> end{0};    // up to the end of the last page
   std::atomic<bool> damaged{false};
 };
 MappedRange mappedRanges[kMostMappings];
+static_assert(std::atomic<uintptr_t>::is_always_lock_free, "the handler may only touch lock-free objects");
 struct sigaction previousAction;
+uintptr_t pageSize = 4096;
 
-void OnBusError(int signalNumber, siginfo_t* info, void*) {
-  const auto address = reinterpret_cast<uintptr_t>(info->si_addr);
+// Puts zero pages from the touched one to the end of its view; false when the address is in none.
+bool ReplaceLostPages(uintptr_t address) {
   for (MappedRange& range : mappedRanges) {
     const uintptr_t begin = range.begin.load(), end = range.end.load();
-    if (address < begin || address >= end) continue;
-    const uintptr_t page = address & ~static_cast<uintptr_t>(4095);
-    const size_t rest = end - page;
-    if (mmap(reinterpret_cast<void*>(page), rest, PROT_READ, MAP_PRIVATE | MAP_ANONYMOUS | MAP_FIXED, -1, 0) ==
-        MAP_FAILED) {
-      break;
-    }
+    if (begin == 0 || address < begin || address >= end) continue;
+    const uintptr_t page = address & ~(pageSize - 1);
     range.damaged = true;
-    return;
+    return mmap(reinterpret_cast<void*>(page), end - page, PROT_READ, MAP_PRIVATE | MAP_ANONYMOUS | MAP_FIXED, -1, 0) !=
+           MAP_FAILED;
   }
-  sigaction(signalNumber, &previousAction, nullptr);  // not ours: the same access raises it again for the old handler
+  return false;
+}
+
+void OnBusError(int signalNumber, siginfo_t* info, void*) {
+  const bool fromMemory = info->si_code > 0;  // not sent by a program
+  if (fromMemory && ReplaceLostPages(reinterpret_cast<uintptr_t>(info->si_addr))) return;
+  sigaction(signalNumber, &previousAction, nullptr);
+  if (!fromMemory) raise(signalNumber);  // an access raises it again by itself
 }
 
 void InstallBusHandler() {
   static std::once_flag once;
   std::call_once(once, [] {
+    pageSize = static_cast<uintptr_t>(sysconf(_SC_PAGESIZE));
     struct sigaction action = {};
     action.sa_sigaction = OnBusError;
-    action.sa_flags = SA_SIGINFO;
+    action.sa_flags = SA_SIGINFO | SA_ONSTACK;
     sigemptyset(&action.sa_mask);
     sigaction(SIGBUS, &action, &previousAction);
   });
@@ -67,24 +74,11 @@ MappedRange* EnterRange(const void* data, uint64_t size) {
   for (MappedRange& range : mappedRanges) {
     if (range.begin != 0) continue;
     range.damaged = false;
-    range.end = reinterpret_cast<uintptr_t>(data) + size;
+    range.end = (reinterpret_cast<uintptr_t>(data) + static_cast<uintptr_t>(size) + pageSize - 1) & ~(pageSize - 1);
     range.begin = reinterpret_cast<uintptr_t>(data);
     return &range;
   }
   return nullptr;
-}
-
-// Reads up to `size` bytes at `offset` into `data`; the number of bytes read, or -1 on an error.
-int64_t ReadAll(int handle, uint64_t offset, uint8_t* data, uint64_t size) {
-  uint64_t done = 0;
-  while (done < size) {
-    const ssize_t count = pread(handle, data + done, size - done, static_cast<off_t>(offset + done));
-    if (count < 0 && errno == EINTR) continue;
-    if (count < 0) return -1;
-    if (count == 0) break;
-    done += static_cast<uint64_t>(count);
-  }
-  return static_cast<int64_t>(done);
 }
 
 }  // namespace
@@ -112,19 +106,15 @@ bool FileView::OpenHead(const char* path, uint64_t count) { return OpenPart(path
 bool FileView::OpenPart(const char* path, uint64_t most) {
   Close();
   if (FaultDue()) return false;
-  const int handle = open(path, O_RDONLY | O_CLOEXEC | O_NONBLOCK | O_NOCTTY);
-  if (handle < 0) return false;
-  handle_ = handle;
   struct stat facts;
-  if (fstat(handle, &facts) != 0 || !S_ISREG(facts.st_mode)) {
-    Close();
-    return false;
-  }
+  handle_ = OpenRegular(path, O_RDONLY, facts).Release();
+  if (handle_ < 0) return false;
   fileSize_ = static_cast<uint64_t>(facts.st_size);
-  size_ = fileSize_ < most ? fileSize_ : most;
+  size_ = std::min(fileSize_, most);
   if (size_ >= kMappedFrom && Map()) return true;
-  const int64_t count =
-      FaultDue() || !copy_.Allocate(size_, Fill::Unset) ? -1 : ReadAll(handle, 0, copy_.Data(), size_);
+  const int64_t count = FaultDue() || !copy_.Allocate(size_, Fill::Unset)
+                            ? -1
+                            : ReadFully(static_cast<int>(handle_), copy_.Data(), size_, 0);
   if (count < 0) {
     Close();
     return false;
@@ -135,33 +125,35 @@ bool FileView::OpenPart(const char* path, uint64_t most) {
 }
 
 bool FileView::Map() {
-  void* data = mmap(nullptr, size_, PROT_READ, MAP_PRIVATE, static_cast<int>(handle_), 0);
+  if (size_ > SIZE_MAX / 2 || FaultDue()) return false;
+  void* data = mmap(nullptr, static_cast<size_t>(size_), PROT_READ, MAP_PRIVATE, static_cast<int>(handle_), 0);
   if (data == MAP_FAILED) return false;
   InstallBusHandler();
   mapping_ = EnterRange(data, size_);
   if (mapping_ == nullptr) {
-    munmap(data, size_);
+    munmap(data, static_cast<size_t>(size_));
     return false;
   }
-  madvise(data, size_, MADV_SEQUENTIAL);
+  madvise(data, static_cast<size_t>(size_), MADV_SEQUENTIAL);
   data_ = static_cast<const uint8_t*>(data);
   return true;
 }
 
 bool FileView::ReadAt(uint64_t offset, std::span<uint8_t> into) const {
-  if (into.size() > fileSize_ || offset > fileSize_ - into.size()) return false;
+  if (handle_ < 0 || into.size() > fileSize_ || offset > fileSize_ - into.size()) return false;
   if (mapping_ == nullptr && offset + into.size() <= size_) {
     if (!into.empty()) std::memcpy(into.data(), data_ + offset, into.size());
     return true;
   }
-  return !FaultDue() && ReadAll(static_cast<int>(handle_), offset, into.data(), into.size()) ==
-                            static_cast<int64_t>(into.size());
+  const int64_t count = FaultDue() ? -1
+                                   : ReadFully(static_cast<int>(handle_), into.data(), into.size(), static_cast<int64_t>(offset));
+  return count == static_cast<int64_t>(into.size());
 }
 
 void FileView::Close() {
   if (mapping_ != nullptr) {
-    munmap(const_cast<uint8_t*>(data_), size_);
-    static_cast<MappedRange*>(mapping_)->begin = 0;
+    static_cast<MappedRange*>(mapping_)->begin = 0;  // first: once unmapped, the addresses may be another view's
+    munmap(const_cast<uint8_t*>(data_), static_cast<size_t>(size_));
     mapping_ = nullptr;
   }
   if (handle_ >= 0) close(static_cast<int>(handle_));
@@ -171,14 +163,18 @@ void FileView::Close() {
   size_ = fileSize_ = dropped_ = 0;
 }
 
+// The page in which a shortened file now ends reads as zeros without a signal, so its length is asked as well.
 bool FileView::Intact() const {
-  return mapping_ == nullptr || !static_cast<const MappedRange*>(mapping_)->damaged.load();
+  if (mapping_ == nullptr) return true;
+  struct stat facts;
+  return !static_cast<const MappedRange*>(mapping_)->damaged.load() && fstat(static_cast<int>(handle_), &facts) == 0 &&
+         static_cast<uint64_t>(facts.st_size) >= size_;
 }
 
 void FileView::DropBefore(uint64_t offset) {
-  if (mapping_ == nullptr || offset < dropped_ + kDropStep || offset > size_) return;
-  const uint64_t end = offset & ~(kDropStep - 1);
-  madvise(const_cast<uint8_t*>(data_) + dropped_, end - dropped_, MADV_DONTNEED);
+  const uint64_t end = std::min(offset, size_) & ~(kDropStep - 1);
+  if (mapping_ == nullptr || end <= dropped_) return;
+  madvise(const_cast<uint8_t*>(data_) + dropped_, static_cast<size_t>(end - dropped_), MADV_DONTNEED);
   dropped_ = end;
 }
 
