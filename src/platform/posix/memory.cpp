@@ -2,12 +2,23 @@
 
 #include <sys/mman.h>
 
+#include <algorithm>
 #include <cstdlib>
 #include <cstring>
 #include <mutex>
-#include <vector>
 
 #include "platform/fault.h"
+
+#if defined(__SANITIZE_ADDRESS__)
+#define FOTOMILL_ADDRESS_SANITIZER 1
+#elif defined(__has_feature)
+#if __has_feature(address_sanitizer)
+#define FOTOMILL_ADDRESS_SANITIZER 1
+#endif
+#endif
+#ifdef FOTOMILL_ADDRESS_SANITIZER
+#include <sanitizer/asan_interface.h>
+#endif
 
 namespace fotomill::platform {
 
@@ -17,58 +28,107 @@ namespace {
 
 constexpr uint64_t kPooledFrom = uint64_t{1} << 20;  // smaller blocks are left to malloc
 constexpr uint64_t kHugePage = uint64_t{2} << 20;
+constexpr uint64_t kSmallUnit = 64 * 1024;  // blocks below two huge pages come in these
 constexpr size_t kPooledBlocks = 16;
 constexpr uint64_t kPooledBytes = uint64_t{512} << 20;
+
+#ifdef FOTOMILL_ADDRESS_SANITIZER
+// Mapped blocks are unknown to the sanitizer: it is told which of their bytes may be touched, and each has some to spare
+// behind its end.
+constexpr uint64_t kGuard = 4096;
+void AllowBytes(const uint8_t* data, uint64_t size, uint64_t capacity) {
+  __asan_unpoison_memory_region(data, size);
+  __asan_poison_memory_region(data + size, capacity - size);
+}
+#else
+constexpr uint64_t kGuard = 0;
+void AllowBytes(const uint8_t*, uint64_t, uint64_t) {}
+#endif
 
 struct FreeBlock {
   uint8_t* data;
   uint64_t capacity;
 };
 
-std::mutex poolMutex;
-std::vector<FreeBlock>& Pool() {
-  static auto* pool = new std::vector<FreeBlock>;  // outlives every block that a static may hold
-  return *pool;
-}
+// Blocks that wait for their next owner, the oldest first. Plain data, so that it outlives every block of a static.
+struct BlockPool {
+  std::mutex mutex;
+  FreeBlock blocks[kPooledBlocks];
+  size_t count;
+  uint64_t bytes;
+
+  FreeBlock Remove(size_t index) {
+    const FreeBlock block = blocks[index];
+    std::copy(blocks + index + 1, blocks + count, blocks + index);
+    --count;
+    bytes -= block.capacity;
+    return block;
+  }
+};
+constinit BlockPool pool{};
 
 uint64_t RoundUp(uint64_t size, uint64_t unit) { return (size + unit - 1) / unit * unit; }
 
+uint64_t CapacityFor(uint64_t size) {
+  return RoundUp(size + kGuard, size >= 2 * kHugePage ? kHugePage : kSmallUnit);
+}
+
+void Unmap(FreeBlock block) {
+  AllowBytes(block.data, block.capacity, block.capacity);
+  munmap(block.data, static_cast<size_t>(block.capacity));
+}
+
+// Gives the oldest blocks back until the pool holds at most `bytes`.
+void ShrinkPool(uint64_t bytes) {
+  for (;;) {
+    FreeBlock block;
+    {
+      const std::lock_guard lock(pool.mutex);
+      if (pool.count == 0 || pool.bytes <= bytes) return;
+      block = pool.Remove(0);
+    }
+    Unmap(block);
+  }
+}
+
 // The smallest pooled block that is large enough without being wasteful; data is null when there is none.
 FreeBlock TakeFromPool(uint64_t capacity) {
-  const std::lock_guard lock(poolMutex);
-  std::vector<FreeBlock>& pool = Pool();
-  size_t best = pool.size();
-  for (size_t i = 0; i < pool.size(); ++i) {
-    const bool fits = pool[i].capacity >= capacity && pool[i].capacity / 2 <= capacity;
-    if (fits && (best == pool.size() || pool[i].capacity < pool[best].capacity)) best = i;
+  const std::lock_guard lock(pool.mutex);
+  size_t best = pool.count;
+  for (size_t i = 0; i < pool.count; ++i) {
+    const uint64_t found = pool.blocks[i].capacity;
+    const bool fits = found >= capacity && found / 2 <= capacity;
+    if (fits && (best == pool.count || found < pool.blocks[best].capacity)) best = i;
   }
-  if (best == pool.size()) return {nullptr, 0};
-  const FreeBlock block = pool[best];
-  pool.erase(pool.begin() + static_cast<std::ptrdiff_t>(best));
-  return block;
+  return best == pool.count ? FreeBlock{nullptr, 0} : pool.Remove(best);
 }
 
 // Keeps the block for later, or unmaps it when the pool holds enough.
 void GiveToPool(FreeBlock block) {
   {
-    const std::lock_guard lock(poolMutex);
-    std::vector<FreeBlock>& pool = Pool();
-    uint64_t held = block.capacity;
-    for (const FreeBlock& other : pool) held += other.capacity;
-    if (pool.size() < kPooledBlocks && held <= kPooledBytes) {
-      pool.push_back(block);
+    const std::lock_guard lock(pool.mutex);
+    if (pool.count < kPooledBlocks && pool.bytes + block.capacity <= kPooledBytes) {
+      AllowBytes(block.data, 0, block.capacity);
+      pool.blocks[pool.count++] = block;
+      pool.bytes += block.capacity;
       return;
     }
   }
-  munmap(block.data, block.capacity);
+  Unmap(block);
 }
 
-// Fresh zero pages, asked to be huge ones where the block is worth it.
-uint8_t* MapFresh(uint64_t capacity) {
-  void* data = mmap(nullptr, capacity, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
-  if (data == MAP_FAILED) return nullptr;
-  if (capacity >= 2 * kHugePage) madvise(data, capacity, MADV_HUGEPAGE);
-  return static_cast<uint8_t*>(data);
+// Fresh zero pages, asked to be huge ones where the block is worth it. What waits in the pool and did not fit counts
+// against what the pool may hold, so that one large picture after many small ones does not have both.
+FreeBlock MapFresh(uint64_t capacity) {
+  ShrinkPool(kPooledBytes - std::min(capacity, kPooledBytes));
+  void* data = mmap(nullptr, static_cast<size_t>(capacity), PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
+  if (data == MAP_FAILED) {
+    ShrinkPool(0);
+    data = mmap(nullptr, static_cast<size_t>(capacity), PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
+  }
+  if (data == MAP_FAILED) return {nullptr, 0};
+  if (capacity >= 2 * kHugePage) madvise(data, static_cast<size_t>(capacity), MADV_HUGEPAGE);
+  return {static_cast<uint8_t*>(data), capacity};
 }
 
 }  // namespace
@@ -93,14 +153,13 @@ bool MemoryBlock::Allocate(uint64_t size, Fill fill) {
     size_ = size;
     return true;
   }
-  const uint64_t capacity = RoundUp(size, size >= 2 * kHugePage ? kHugePage : uint64_t{65536});
+  const uint64_t capacity = CapacityFor(size);
   FreeBlock block = TakeFromPool(capacity);
-  if (block.data != nullptr) {
-    if (fill == Fill::Zero) std::memset(block.data, 0, static_cast<size_t>(size));
-  } else {
-    block = {MapFresh(capacity), capacity};
-    if (block.data == nullptr) return false;
-  }
+  const bool used = block.data != nullptr;
+  if (!used) block = MapFresh(capacity);
+  if (block.data == nullptr) return false;
+  AllowBytes(block.data, size, block.capacity);
+  if (used && fill == Fill::Zero) std::memset(block.data, 0, static_cast<size_t>(size));
   data_ = block.data;
   capacity_ = block.capacity;
   size_ = size;
@@ -108,10 +167,19 @@ bool MemoryBlock::Allocate(uint64_t size, Fill fill) {
 }
 
 bool MemoryBlock::Resize(uint64_t size) {
-  MemoryBlock bigger;
-  if (!bigger.Allocate(size)) return false;
-  if (size_ != 0) std::memcpy(bigger.data_, data_, static_cast<size_t>(size_ < size ? size_ : size));
-  *this = std::move(bigger);
+  const bool staysInPlace = size >= kPooledFrom && size + kGuard <= capacity_ && capacity_ / 2 <= CapacityFor(size);
+  if (staysInPlace && !FaultDue()) {
+    AllowBytes(data_, size, capacity_);
+    if (size > size_) std::memset(data_ + size_, 0, static_cast<size_t>(size - size_));
+    size_ = size;
+    return true;
+  }
+  MemoryBlock other;
+  if (staysInPlace || !other.Allocate(size, Fill::Unset)) return false;
+  const uint64_t kept = std::min(size_, size);
+  if (kept != 0) std::memcpy(other.data_, data_, static_cast<size_t>(kept));
+  if (size > kept) std::memset(other.data_ + kept, 0, static_cast<size_t>(size - kept));
+  *this = std::move(other);
   return true;
 }
 
@@ -126,10 +194,6 @@ void MemoryBlock::Free() {
   size_ = capacity_ = 0;
 }
 
-void TrimMemoryPool() {
-  const std::lock_guard lock(poolMutex);
-  for (const FreeBlock& block : Pool()) munmap(block.data, block.capacity);
-  Pool().clear();
-}
+void TrimMemoryPool() { ShrinkPool(0); }
 
 }  // namespace fotomill::platform
