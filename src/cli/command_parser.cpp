@@ -4,6 +4,7 @@
 #include <memory>
 #include <string_view>
 
+#include "cli/option_checks.h"
 #include "core/nearest_name.h"
 
 namespace fotomill::cli {
@@ -29,6 +30,9 @@ class HelpFormatter : public CLI::Formatter {
     CLI::detail::format_help(out, names_.placeholder, names_.help, kFirstColumn);
     return out.str();
   }
+  std::string make_option_name(const CLI::Option* option, bool) const override {
+    return CLI::detail::find_and_replace(option->get_name(false, true), ",", ", ");
+  }
   std::string make_option_opts(const CLI::Option* option) const override {
     if (option->get_type_size() == 0) return {};
     return " " + (option->get_option_text().empty() ? option->get_type_name() : option->get_option_text());
@@ -40,7 +44,9 @@ class HelpFormatter : public CLI::Formatter {
 
 void AddGlobalOptions(CLI::App& app, GlobalOptions& global) {
   app.option_defaults()->group(kGlobalGroup);
-  app.add_option("--data", global.dataFolder, "Folder of the configuration and the stores")->option_text("DIR");
+  app.add_option("--data", global.dataFolder, "Folder of the configuration and the stores")
+      ->option_text("DIR")
+      ->check(NotEmpty());
   app.add_option("--set", global.settings, "Give a configuration key a value for this run; may be repeated")
       ->option_text("KEY=VALUE")
       ->allow_extra_args(false);

@@ -1,6 +1,7 @@
 #include "cli/commands.h"
 
 #include "cli/config.h"
+#include "cli/convert.h"
 #include "cli/exif.h"
 #include "cli/formats.h"
 #include "cli/info.h"
@@ -14,6 +15,7 @@ namespace {
 
 // clang-format off
 constexpr Command kCommands[] = {
+    {"convert", "convert pictures to another format",                          Needs::Formats,  SetUpConvert},
     {"info",    "tell what files hold, without decoding them",                 Needs::Formats,  SetUpInfo},
     {"formats", "list the formats and what this build can do with them",       Needs::Formats,  SetUpFormats},
     {"match",   "tell which format a file name selects, without opening it",   Needs::Formats,  SetUpMatch},

@@ -1,9 +1,9 @@
 #include "cli/file_selection.h"
 
-#include <CLI/CLI.hpp>
 #include <set>
 #include <utility>
 
+#include "cli/option_checks.h"
 #include "core/limits.h"
 #include "picture/registry.h"
 #include "platform/files.h"
@@ -98,7 +98,8 @@ void AddSelection(CLI::App& app, SelectionOptions& options, CommandContext& cont
   context.names.Declare("FILE...", "Pictures, and folders whose pictures are meant", 0);
   app.add_flag("-r,--recursive", options.recursive, "Take the folders in named folders as well");
   app.add_option("--files-from", options.filesFrom, "Take names from a file, one a line; - is the standard input")
-      ->option_text("FILE|-");
+      ->option_text("FILE|-")
+      ->check(NotEmpty());
   app.add_flag("-0,--null", options.zeroTerminated, "Names in that file end in a zero byte instead");
 }
 

@@ -40,7 +40,7 @@ std::string MainHelp() {
   const auto formatter = std::dynamic_pointer_cast<const CLI::Formatter>(parser.get_formatter());
   page += formatter->make_groups(&parser, CLI::AppFormatMode::Normal);
   page +=
-      "  -V,--version            Print the versions of the program and its libraries\n\n"
+      "  -V, --version           Print the versions of the program and its libraries\n\n"
       "Examples: fotomill convert holiday --to png --dest out\n"
       "          fotomill help convert\n";
   return page;

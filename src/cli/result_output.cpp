@@ -60,6 +60,10 @@ std::string ResultOutput::Shown(std::string_view name) const {
   return context_.io.outTerminal ? EscapeControls(name) : std::string(name);
 }
 
+std::string ResultOutput::ShownMessage(std::string_view name) const {
+  return context_.io.errTerminal ? EscapeControls(name) : std::string(name);
+}
+
 void ResultOutput::Line(std::string_view line) {
   Write(context_.io.out, line);
   Write(context_.io.out, "\n");
@@ -76,12 +80,11 @@ void ResultOutput::Element(const Json& element) {
 void ResultOutput::Failure(std::string_view name, Status status, std::string_view hint) {
   ++files_;
   ++failures_;
-  std::string text = context_.io.errTerminal ? EscapeControls(name) : std::string(name);
-  text += ": ";
+  std::string text = ShownMessage(name) + ": ";
   if (colored_) text += kRed;
   text += StatusMessage(status);
   if (colored_) text += kPlain;
-  if (!hint.empty()) text.append(" ").append(hint);
+  if (!hint.empty()) text += " " + ShownMessage(hint);
   PrintMessage(text);
 }
 

@@ -30,6 +30,8 @@ class ResultOutput {
   bool IsJson() const { return json_; }
   // A name as a line shows it: escaped on a terminal, byte for byte elsewhere.
   std::string Shown(std::string_view name) const;
+  // The same for messages.
+  std::string ShownMessage(std::string_view name) const;
 
   // One result line, without its end; the caller has escaped what needs it. Not for JSON.
   void Line(std::string_view line);

@@ -9,6 +9,7 @@
 #include "cli/commands.h"
 #include "cli/help.h"
 #include "cli/prepare.h"
+#include "cli/shown_text.h"
 #include "core/nearest_name.h"
 #include "platform/process.h"
 
@@ -23,7 +24,8 @@ void Print(std::FILE* stream, std::string_view text) {
 }
 
 int Complain(const Io& io, const std::string& message, const std::string& topic = {}) {
-  Print(io.err, "fotomill: " + message + "\nTry \"fotomill help" + (topic.empty() ? "" : " " + topic) + "\".\n");
+  Print(io.err, "fotomill: " + (io.errTerminal ? EscapeControls(message) : message) + "\nTry \"fotomill help" +
+                    (topic.empty() ? "" : " " + topic) + "\".\n");
   return kExitUsage;
 }
 
@@ -97,7 +99,10 @@ int ParseAndRun(const Command* command, const Arguments& arguments, const Io& io
   }
   if (command == nullptr) return Complain(io, "A command is missing.");
   const std::string problem = PrepareFor(*command, context.global);
-  return problem.empty() ? context.run() : Complain(io, problem, command->name);
+  if (!problem.empty()) return Complain(io, std::string(command->name) + ": " + problem, command->name);
+  const int status = context.run();
+  FinishAfter(*command);
+  return status;
 }
 
 int Dispatch(Arguments arguments, const Io& io) {

@@ -1,0 +1,248 @@
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <filesystem>
+#include <nlohmann/json.hpp>
+
+#include "support/bitmaps.h"
+#include "support/command_line.h"
+#include "support/files.h"
+
+namespace fotomill::test {
+namespace {
+
+namespace fs = std::filesystem;
+using nlohmann::json;
+using testing::ElementsAre;
+using testing::HasSubstr;
+
+// A folder with pictures of every kind of trouble.
+class FileCommands : public testing::Test {
+ protected:
+  FileCommands() {
+    Put("a.bmp", BitmapFile(5, 3, 24));
+    Put("b.BMP", BitmapFile(4, 4, 8));
+    WriteText(In("notes"), "no picture");
+    Put("sub/c.bmp", BitmapFile(9, 1, 1));
+    Put("sub/deep/d.bmp", BitmapFile(1, 1, 1));
+    fs::create_directory(In("empty"));
+  }
+  std::string In(const std::string& name) const { return folder_.Path(name); }
+  void Put(const std::string& name, const std::vector<uint8_t>& bytes) {
+    fs::create_directories(fs::path(In(name)).parent_path());
+    WriteBytes(In(name), bytes);
+  }
+  // The `file` fields, with the folder left out.
+  std::vector<std::string> Files(const CommandResult& result) const {
+    std::vector<std::string> files;
+    for (const json& element : json::parse(result.out)) {
+      files.push_back(fs::path(element["file"].get<std::string>()).lexically_relative(folder_.Path()));
+    }
+    return files;
+  }
+
+  TemporaryFolder folder_;
+};
+
+TEST_F(FileCommands, SelectionKeepsItsOrder) {
+  fs::create_directory_symlink(folder_.Path(), In("sub/again"));
+  fs::create_symlink(In("a.bmp"), In("link.bmp"));
+  fs::create_symlink(In("nowhere.bmp"), In("dangling.bmp"));
+  mkfifo(In("pipe.bmp").c_str(), 0600);
+  WriteText(In("list"), In("sub/c.bmp") + "\n\n" + In("a.bmp"));
+  WriteBytes(In("zeros"), {});
+  const std::string zeros = In("b.BMP") + std::string(1, '\0') + In("a.bmp");
+  WriteText(In("zeros"), zeros);
+  const struct {
+    const char* name;
+    std::vector<std::string> arguments;
+    std::vector<std::string> files;
+  } rows[] = {
+      {"as named", {In("b.BMP"), In("a.bmp")}, {"b.BMP", "a.bmp"}},
+      {"folder", {folder_.Path()}, {"a.bmp", "b.BMP", "link.bmp"}},
+      {"folder with separator", {In("sub/")}, {"sub/c.bmp"}},
+      {"file, folder, file", {In("b.BMP"), In("sub"), In("a.bmp")}, {"b.BMP", "sub/c.bmp", "a.bmp"}},
+      {"recursive", {"-r", folder_.Path()}, {"a.bmp", "b.BMP", "link.bmp", "sub/c.bmp", "sub/deep/d.bmp"}},
+      {"list", {"--files-from", In("list")}, {"sub/c.bmp", "a.bmp"}},
+      {"names, then list", {In("b.BMP"), "--files-from", In("list")}, {"b.BMP", "sub/c.bmp", "a.bmp"}},
+      {"list with zeros", {"-0", "--files-from", In("zeros")}, {"b.BMP", "a.bmp"}},
+      {"named twice", {In("a.bmp"), In("a.bmp")}, {"a.bmp", "a.bmp"}},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    std::vector<std::string> arguments{"info", "--json"};
+    arguments.insert(arguments.end(), row.arguments.begin(), row.arguments.end());
+    const CommandResult result = RunCommand(arguments);
+    EXPECT_EQ(result.status, 0) << result.err;
+    EXPECT_EQ(Files(result), row.files);
+  }
+  const CommandResult fromInput =
+      RunCommand({"info", "--json", "--files-from", "-"}, {.input = In("sub/c.bmp") + "\n"});
+  EXPECT_THAT(Files(fromInput), ElementsAre("sub/c.bmp"));
+  EXPECT_EQ(RunCommand({"info", "--files-from", In("missing")}).status, 2);
+}
+
+TEST_F(FileCommands, WhatCannotBeOpenedFailsAloneWithAMessage) {
+  mkfifo(In("pipe.bmp").c_str(), 0600);
+  fs::create_symlink(In("nowhere.bmp"), In("dangling.bmp"));
+  WriteText(In("empty.bmp"), "");
+  WriteText(In("text.bmp"), "this is no bitmap at all, whatever its name says");
+  WriteText(In("photo.avif"), std::string("\0\0\0\x1c", 4) + "ftypavif....");
+  const struct {
+    const char* name;
+    int number;
+    const char* message;
+  } rows[] = {
+      {"missing.bmp", 1, "File open error. There is no such file."},
+      {"pipe.bmp", 1, "File open error."},
+      {"dangling.bmp", 1, "File open error."},
+      {"notes", 8, "Unsupported format. No format goes by that extension."},
+      {"text.bmp", 2, "Damaged file."},
+      {"photo.avif", 5, "Unsupported function. It looks like AVIF."},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    const std::string path = In(row.name);
+    for (const std::string command : {"info", "verify"}) {
+      const CommandResult result = RunCommand({command, "--json", path, In("a.bmp")});
+      EXPECT_EQ(result.status, 1);
+      const json array = json::parse(result.out);
+      ASSERT_EQ(array.size(), 2u);
+      EXPECT_EQ(array[0]["file"], path);
+      EXPECT_EQ(array[0]["status"], row.number);
+      EXPECT_EQ(array[1]["status"], 0);
+      EXPECT_EQ(result.err, path + ": " + row.message + "\nThere were errors\n2 files were processed.\n");
+    }
+  }
+  EXPECT_EQ(RunCommand({"info", In("empty.bmp")}).status, 1);
+  const std::string tooLong = In(std::string(300, 'x') + ".bmp");
+  EXPECT_EQ(RunCommand({"info", tooLong}).status, 1);
+}
+
+// The superuser may read everything, so the tests' own user steps down meanwhile.
+class OrdinaryUser {
+ public:
+  OrdinaryUser() : stepped_(geteuid() == 0 && seteuid(65534) == 0) {}
+  ~OrdinaryUser() {
+    if (stepped_ && seteuid(0) != 0) ADD_FAILURE() << "cannot step up again";
+  }
+
+ private:
+  const bool stepped_;
+};
+
+TEST_F(FileCommands, UnreadableFilesAndFolders) {
+  fs::permissions(folder_.Path(), fs::perms(0755));
+  fs::permissions(In("a.bmp"), fs::perms::none);
+  fs::permissions(In("sub"), fs::perms::none);
+  CommandResult info, convert;
+  {
+    const OrdinaryUser user;
+    info = RunCommand({"info", "-r", folder_.Path()});
+    convert = RunCommand({"convert", In("b.BMP"), "-t", "pcx", "-d", In("empty")});
+  }
+  fs::permissions(In("sub"), fs::perms::owner_all);
+  EXPECT_EQ(info.status, 1);
+  EXPECT_TRUE(info.Says(In("a.bmp") + ": File open error.")) << info.err;
+  EXPECT_TRUE(info.Says(In("sub") + ": File open error. The folder cannot be read.")) << info.err;
+  EXPECT_EQ(convert.status, 1);
+  EXPECT_THAT(convert.err, HasSubstr(": Error creating file. "));
+}
+
+TEST_F(FileCommands, ClosingLines) {
+  const struct {
+    std::vector<std::string> arguments;
+    int status;
+    std::string err;
+  } rows[] = {
+      {{"verify", In("empty")}, 0, "No files were processed.\n"},
+      {{"verify", In("a.bmp")}, 0, "One file was processed.\n"},
+      {{"verify", In("a.bmp"), In("b.BMP")}, 0, "2 files were processed.\n"},
+      {{"-q", "verify", In("a.bmp")}, 0, ""},
+      {{"-q", "verify", In("no.bmp")}, 1, In("no.bmp") + ": File open error. There is no such file.\n"},
+  };
+  for (const auto& row : rows) {
+    const CommandResult result = RunCommand(row.arguments);
+    EXPECT_EQ(result.status, row.status);
+    EXPECT_EQ(result.err, row.err);
+  }
+}
+
+TEST_F(FileCommands, InfoAsJson) {
+  const CommandResult result = RunCommand({"info", "--json", In("a.bmp"), In("missing.bmp")});
+  const json array = json::parse(result.out);
+  const json& facts = array[0];
+  const char* const keys[] = {"file",  "status", "message",      "format", "index",    "description", "typeName",
+                              "width", "height", "bitsPerPixel", "alpha",  "fileSize", "imageBytes",  "details"};
+  for (const char* key : keys) EXPECT_TRUE(facts.contains(key)) << key;
+  EXPECT_EQ(facts["format"], "BMP");
+  EXPECT_EQ(facts["width"], 5);
+  EXPECT_EQ(facts["height"], 3);
+  EXPECT_EQ(facts["bitsPerPixel"], 24);
+  EXPECT_EQ(facts["fileSize"], 54 + 16 * 3);
+  EXPECT_TRUE(facts["details"].is_array());
+  EXPECT_EQ(array[1].size(), 3u) << array[1];  // file, status, message
+  EXPECT_EQ(array[1]["message"], "File open error.");
+  // An element a line, so that readers need no parser to count them.
+  EXPECT_EQ(std::count(result.out.begin(), result.out.end(), '\n'), 4);
+  EXPECT_EQ(RunCommand({"info", "--json", In("empty")}).out, "[\n]\n");
+}
+
+TEST_F(FileCommands, HostileNames) {
+  const std::string escape = In("e\x1b[31m\n.bmp"), bytes = In("\xff\x41.bmp");
+  for (const std::string& name : {escape, bytes}) WriteBytes(name, BitmapFile(1, 1, 1));
+  const json array = json::parse(RunCommand({"info", "--json", escape, bytes}).out);
+  EXPECT_EQ(array[0]["file"], escape);
+  EXPECT_FALSE(array[0].contains("fileBytes"));
+  EXPECT_THAT(array[1]["file"].get<std::string>(), testing::EndsWith("/\xef\xbf\xbd"
+                                                                     "A.bmp"));
+  EXPECT_TRUE(array[1].contains("fileBytes"));
+  // Pipes get the name as it is, terminals never a control character.
+  EXPECT_THAT(RunCommand({"verify", escape}).out, HasSubstr("e\x1b[31m\n.bmp: Ok"));
+  EXPECT_THAT(RunCommand({"verify", escape}, {.output = true}).out, HasSubstr("e\\x1B[31m\\n.bmp: Ok"));
+  const CommandResult failing =
+      RunCommand({"--color=never", "verify", In("\x1b]0;owned\x07.bmp")}, {.interactive = true});
+  EXPECT_EQ(failing.err.find('\x1b'), std::string::npos);
+}
+
+TEST_F(FileCommands, VerifyDecodesWhatInfoOnlyLooksAt) {
+  std::vector<uint8_t> cut = BitmapFile(64, 64, 24);
+  cut.resize(cut.size() / 2);
+  Put("cut.bmp", cut);
+  EXPECT_EQ(RunCommand({"info", In("cut.bmp")}).status, 0);
+  const CommandResult result = RunCommand({"verify", In("cut.bmp")});
+  EXPECT_EQ(result.status, 1);
+  EXPECT_TRUE(result.Says(In("cut.bmp") + ": File read error.")) << result.err;
+}
+
+TEST(MatchCommand, TellsTheRowAndTheRule) {
+  const CommandResult text = RunCommand({"match", "scan.tiff", "x.bmp", "odd.abc"});
+  EXPECT_EQ(text.status, 1);
+  EXPECT_EQ(text.out,
+            "scan.tiff: TIF, (TIF) TIFF, by its first three characters\n"
+            "x.bmp: BMP, (BMP) Windows bitmap, by its extension\n"
+            "odd.abc: no format\n");
+  const json array = json::parse(RunCommand({"match", "--json", "photo.jpeg", "odd.abc"}).out);
+  EXPECT_EQ(array[0], json::parse(R"({"name":"photo.jpeg","index":56,"extension":"JPE","typeName":"(JPEG) Jpeg"})"));
+  EXPECT_EQ(array[1], json::parse(R"J({"name":"odd.abc","index":-1,"extension":"","typeName":"(ABC) ABC file"})J"));
+}
+
+TEST(FormatsCommand, ListsTheRegistry) {
+  const json array = json::parse(RunCommand({"formats", "--json"}).out);
+  ASSERT_EQ(array.size(), 78u);
+  EXPECT_EQ(array[2]["extension"], "BMP");
+  EXPECT_EQ(array[2]["flags"], 0x2000001);
+  EXPECT_TRUE(array[2]["read"].get<bool>() && array[2]["write"].get<bool>() && !array[2].contains("reason"));
+  for (const json& row : array) {
+    EXPECT_EQ(row["read"].get<bool>() && row["write"].get<bool>(), !row.contains("reason")) << row;
+  }
+  const std::string destinations = RunCommand({"formats", "--destinations"}).out;
+  EXPECT_THAT(destinations, testing::StartsWith("bga\nbmp\ncdr\n"));
+  EXPECT_EQ(std::count(destinations.begin(), destinations.end(), '\n'), 35);
+  EXPECT_THAT(RunCommand({"formats", "--filter"}).out, HasSubstr("\n(BMP) Windows bitmap\t*.BMP\n"));
+}
+
+}  // namespace
+}  // namespace fotomill::test

@@ -1,0 +1,157 @@
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include "cli/command.h"
+#include "cli/commands.h"
+#include "cli/shown_text.h"
+#include "support/command_line.h"
+#include "support/scoped_environment.h"
+
+namespace fotomill::test {
+namespace {
+
+using testing::HasSubstr;
+using testing::IsEmpty;
+
+TEST(Frame, ExitStatusesAndMessages) {
+  const struct {
+    const char* name;
+    std::vector<std::string> arguments;
+    int status;
+    const char* out;  // a part of it
+    const char* err;
+  } rows[] = {
+      {"no command", {}, 2, "", "Usage: fotomill"},
+      {"options only", {"--quiet"}, 2, "", "A command is missing."},
+      {"unknown command", {"convrt", "x.bmp"}, 2, "", "There is no command \"convrt\". Did you mean \"convert\"?"},
+      {"unknown command, nothing near", {"xyzzy"}, 2, "", "There is no command \"xyzzy\".\n"},
+      {"unknown option",
+       {"match", "--jsn", "a.bmp"},
+       2,
+       "",
+       "match: There is no option \"--jsn\". Did you mean \"--json\"?"},
+      {"unknown short option", {"match", "-z", "a.bmp"}, 2, "", "There is no option \"-z\"."},
+      {"unknown option before the command", {"--bogus", "match", "a.bmp"}, 2, "", "There is no option \"--bogus\"."},
+      {"missing name", {"match"}, 2, "", "NAME... is required"},
+      {"one name too many", {"formats", "x"}, 2, "", "\"x\" is one argument too many"},
+      {"option that lacks its value", {"match", "--data"}, 2, "", "--data"},
+      {"value not offered", {"--color", "blue", "match", "a.bmp"}, 2, "", "--color"},
+      {"empty folder", {"--data=", "match", "a.bmp"}, 2, "", "--data: is empty"},
+      {"no number", {"convert", "-t", "pcx", "--page", "x", "a.bmp"}, 2, "", "--page"},
+      {"number out of range", {"convert", "-t", "pcx", "--page", "0", "a.bmp"}, 2, "", "--page"},
+      {"no files", {"info"}, 2, "", "No files are named."},
+      {"options that exclude each other", {"formats", "--json", "--filter"}, 2, "", "excludes"},
+      {"version", {"--version"}, 0, "Fotomill Professional 11.0.16\nCLI11 ", ""},
+      {"short version", {"-V"}, 0, "nlohmann-json ", ""},
+      {"help", {"--help"}, 0, "convert", ""},
+      {"help of a command", {"help", "convert"}, 0, "Example: fotomill convert", ""},
+      {"help of a command that is not", {"help", "convrt"}, 2, "", "Did you mean \"convert\"?"},
+      {"-h of a command without its names", {"info", "-h"}, 0, "Example: fotomill info", ""},
+      {"help is no mistake beside one", {"help"}, 0, "Usage: fotomill", ""},
+      {"command after global options", {"--color", "never", "--data", "d", "match", "a.bmp"}, 0, "BMP", ""},
+      {"global options after it", {"match", "a.bmp", "-q", "--no-input", "--no-plugins"}, 0, "BMP", ""},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    const CommandResult result = RunCommand(row.arguments);
+    EXPECT_EQ(result.status, row.status);
+    EXPECT_THAT(result.out, HasSubstr(row.out));
+    EXPECT_THAT(result.err, HasSubstr(row.err));
+    EXPECT_THAT(row.status == 2 ? result.out : result.err, IsEmpty());
+  }
+}
+
+// Whatever a name looks like, it comes through byte for byte.
+TEST(Frame, NamesComeThroughUnchanged) {
+  for (const std::string name : {"[a,b].bmp", "[x]", "{}", "%%", "", " ", "a\nb.bmp", "\xff\xfe.bmp", "--", "-x.bmp",
+                                 "--json", "a=b", "++", "/?", "match", "-5", "\"quoted\""}) {
+    SCOPED_TRACE(name);
+    const CommandResult result = RunCommand({"match", "--", name, "end.bmp"});
+    EXPECT_THAT(result.out, testing::StartsWith(name + ": "));
+    EXPECT_THAT(result.out, HasSubstr("\nend.bmp: BMP"));
+  }
+}
+
+TEST(Frame, EveryCommandHasAPageWithAnExample) {
+  for (const cli::Command& command : cli::Commands()) {
+    SCOPED_TRACE(command.name);
+    const std::string name = command.name;
+    const CommandResult page = RunCommand({"help", name});
+    EXPECT_EQ(page.status, 0);
+    EXPECT_THAT(page.out, HasSubstr("Usage: fotomill " + name));
+    EXPECT_THAT(page.out, HasSubstr("Example"));
+    EXPECT_THAT(page.out, HasSubstr("--help"));
+  }
+}
+
+TEST(Frame, UnwritableOutputIsAFailure) {
+  std::FILE* full = std::fopen("/dev/full", "w");
+  if (full == nullptr) GTEST_SKIP() << "no device that is always full";
+  std::FILE* messages = std::tmpfile();
+  const char* arguments[] = {"fotomill", "formats", "--json"};
+  EXPECT_EQ(cli::RunCommandLine(3, arguments, {stdin, full, messages}), 1);
+  std::fclose(full);
+  std::fclose(messages);
+}
+
+TEST(Frame, ColourFollowsOptionTerminalAndEnvironment) {
+  const struct {
+    const char* name;
+    std::vector<std::string> options;
+    bool terminal;
+    const char* noColor;
+    bool colored;
+  } rows[] = {
+      {"pipe", {}, false, nullptr, false},
+      {"terminal", {}, true, nullptr, true},
+      {"NO_COLOR", {}, true, "1", false},
+      {"NO_COLOR empty", {}, true, "", true},
+      {"never", {"--color=never"}, true, nullptr, false},
+      {"always", {"--color=always"}, false, "1", true},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    const ScopedEnvironment environment("NO_COLOR", row.noColor);
+    std::vector<std::string> arguments{"info", "/missing.bmp"};
+    arguments.insert(arguments.end(), row.options.begin(), row.options.end());
+    const CommandResult result = RunCommand(arguments, {.interactive = row.terminal});
+    EXPECT_EQ(result.err.find('\x1b') != std::string::npos, row.colored) << result.err;
+  }
+}
+
+TEST(ShownText, ControlsAndBrokenUtf8AreEscaped) {
+  const struct {
+    const char* text;
+    const char* shown;
+    bool utf8;
+  } rows[] = {
+      {"plain \\ name", "plain \\ name", true},
+      {"a\nb\tc\rd", "a\\nb\\tc\\rd", true},
+      {"\x1b[31m\x7f", "\\x1B[31m\\x7F", true},
+      {"gr\xc3\xbc\xc3\x9f \xe2\x82\xac \xf0\x9f\x98\x80", "gr\xc3\xbc\xc3\x9f \xe2\x82\xac \xf0\x9f\x98\x80", true},
+      {"\xc2\x9b"
+       "31m",
+       "\\xC2\\x9B31m", true},  // a control sequence introducer of eight bits
+      {"\x9b", "\\x9B", false},
+      {"\xc0\xaf", "\\xC0\\xAF", false},           // too long a form
+      {"\xed\xa0\x80", "\\xED\\xA0\\x80", false},  // a surrogate
+      {"\xf4\x90\x80\x80", "\\xF4\\x90\\x80\\x80", false},
+      {"cut \xe2\x82", "cut \\xE2\\x82", false},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.shown);
+    EXPECT_EQ(cli::EscapeControls(row.text), row.shown);
+    EXPECT_EQ(cli::IsUtf8(row.text), row.utf8);
+  }
+}
+
+TEST(ShownText, Base64OfEveryRemainder) {
+  EXPECT_EQ(cli::Base64(""), "");
+  EXPECT_EQ(cli::Base64("f"), "Zg==");
+  EXPECT_EQ(cli::Base64("fo"), "Zm8=");
+  EXPECT_EQ(cli::Base64("foo"), "Zm9v");
+  EXPECT_EQ(cli::Base64("\xff\xfe\xfd\xfc"), "//79/A==");
+}
+
+}  // namespace
+}  // namespace fotomill::test

@@ -1,0 +1,11 @@
+#pragma once
+
+#include <cstdint>
+#include <vector>
+
+namespace fotomill::test {
+
+// The bytes of a bitmap file: 1, 8 or 24 bits, its pixels in stripes of two colours.
+std::vector<uint8_t> BitmapFile(int32_t width, int32_t height, int32_t bits);
+
+}  // namespace fotomill::test
