@@ -193,16 +193,19 @@ TEST(WritePicture, KeepsTheSourceNameAndFlattensWhereAlphaCannotGo) {
 
 TEST(WritePicture, FlatteningAPalettePictureMayMakeItTooDeep) {
   const TemporaryFolder folder;
-  for (const uint8_t alpha : {uint8_t{255}, uint8_t{254}}) {
+  std::vector<uint8_t> greys(512);
+  for (size_t i = 0; i < greys.size(); ++i) greys[i] = static_cast<uint8_t>(i);
+  for (const uint8_t alpha : {uint8_t{255}, uint8_t{100}}) {
     SCOPED_TRACE(+alpha);
-    const PicturePointer picture = MakePicture(2, 1, 8, {{7, 9}});
-    ASSERT_EQ(NewAlphaPlane(2, 1, picture->alpha), Status::Ok);
-    picture->alpha.Row(0)[0] = alpha;
-    picture->alpha.Row(0)[1] = 255;
-    picture->alphaFlags = kHasAlpha;
-    const Status status = WritePicture(*picture, folder.Path("x.rle"), {});
-    EXPECT_EQ(status == Status::TooManyColors, alpha == 254);
-    EXPECT_EQ(picture->bitsPerPixel, alpha == 254 ? 24 : 8);
+    const PicturePointer picture = MakePicture(512, 1, 8, {greys});
+    ASSERT_EQ(NewAlphaPlane(512, 1, picture->alpha), Status::Ok);
+    for (size_t x = 0; x < 512; ++x) picture->alpha.Row(0)[x] = x < 256 ? 255 : alpha;
+    picture->alphaFlags = kHasAlpha | kFlattenOnBackground;
+    picture->background = 0x0000ff;  // greys with red in them are no greys any more: twice as many colours
+    const Status status = WritePicture(*picture, folder.Path("x.fit"), {});
+    EXPECT_EQ(status, Status::Ok);
+    EXPECT_EQ(picture->bitsPerPixel, alpha == 255 ? 8 : 24);
+    EXPECT_EQ(WritePicture(*picture, folder.Path("x.rle"), {}) == Status::TooManyColors, alpha != 255);
   }
 }
 
