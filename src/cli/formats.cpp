@@ -5,7 +5,7 @@
 #include <string>
 
 #include "cli/result_output.h"
-#include "cli/shown_text.h"
+#include "core/shown_text.h"
 #include "core/text.h"
 #include "picture/registry.h"
 

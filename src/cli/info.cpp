@@ -7,7 +7,7 @@
 #include "cli/file_selection.h"
 #include "cli/picture_failure.h"
 #include "cli/result_output.h"
-#include "cli/shown_text.h"
+#include "core/shown_text.h"
 #include "core/text.h"
 #include "picture/registry.h"
 

@@ -3,7 +3,7 @@
 #include <optional>
 #include <string_view>
 
-#include "cli/shown_text.h"
+#include "core/shown_text.h"
 
 namespace fotomill::cli {
 

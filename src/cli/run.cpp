@@ -9,8 +9,8 @@
 #include "cli/commands.h"
 #include "cli/help.h"
 #include "cli/prepare.h"
-#include "cli/shown_text.h"
 #include "core/nearest_name.h"
+#include "core/shown_text.h"
 #include "platform/process.h"
 
 namespace fotomill::cli {

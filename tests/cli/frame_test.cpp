@@ -4,6 +4,7 @@
 #include "cli/command.h"
 #include "cli/commands.h"
 #include "cli/shown_text.h"
+#include "core/shown_text.h"
 #include "support/command_line.h"
 #include "support/scoped_environment.h"
 
@@ -140,8 +141,8 @@ TEST(ShownText, ControlsAndBrokenUtf8AreEscaped) {
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.shown);
-    EXPECT_EQ(cli::EscapeControls(row.text), row.shown);
-    EXPECT_EQ(cli::IsUtf8(row.text), row.utf8);
+    EXPECT_EQ(EscapeControls(row.text), row.shown);
+    EXPECT_EQ(IsUtf8(row.text), row.utf8);
   }
 }
 
