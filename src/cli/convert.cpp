@@ -59,7 +59,8 @@ int32_t RowOfExtension(std::string_view extension) {
     const bool named = (row.flags & (FMT_SPARE | FMT_CLIPBOARD)) == 0 && EqualIgnoringCase(row.extension, extension);
     if (named) return i;
   }
-  return kNoFormat;
+  if (extension.empty() || extension.find_first_of("./\\") != std::string_view::npos) return kNoFormat;
+  return FindPluginFormat("x." + std::string(extension));
 }
 
 std::string UnknownFormat(const std::string& extension) {
@@ -67,6 +68,7 @@ std::string UnknownFormat(const std::string& extension) {
   for (int32_t i = 0; i < formatCount; ++i) {
     if (CanWrite(FormatRow(i))) known.push_back(LowerCase(FormatRow(i).extension));
   }
+  for (const PluginFormatFacts& format : PluginFormats()) known.push_back(LowerCase(format.extension));
   const std::vector<std::string_view> names(known.begin(), known.end());
   return "There is no format \"" + extension + "\"." + NearestNameHint(extension, names);
 }
@@ -80,6 +82,7 @@ class Conversion {
         context_(context),
         rowIndex_(row),
         row_(FormatRow(row)),
+        extension_(row_.extension),
         files_(files),
         names_(files),
         output_(context, options.json) {
@@ -135,9 +138,8 @@ class Conversion {
   std::string PlannedName(const SelectedFile& file) const {
     if (!options_.out.empty()) return options_.out;
     const platform::PathParts parts = platform::SplitPath(file.name);
-    const std::string name =
-        options_.prefix + std::string(parts.base) + "." +
-        CasedExtension(row_.extension, platform::ExtensionOf(file.name), settings.ExtensionCaseStyle);
+    const std::string name = options_.prefix + std::string(parts.base) + "." +
+                             CasedExtension(extension_, platform::ExtensionOf(file.name), settings.ExtensionCaseStyle);
     if (options_.dest.empty()) return platform::JoinPath({parts.drive, parts.folder, name, {}});
     std::string folder = options_.dest;
     if (options_.keepTree && !file.below.empty()) folder = platform::JoinFolder(folder, file.below);
@@ -155,6 +157,8 @@ class Conversion {
     if (const Status status = Load(file.name, picture); status != Status::Ok) {
       return {status, LoadHint(file.name, status, picture.get()), {}, false};
     }
+    // The source may have bound its own plug-in format to the row that the destination's had.
+    if (rowIndex_ == kSpareRow) (void)FindPluginFormat("x." + extension_);
     if (const Status status = FitColors(*picture); status != Status::Ok) {
       return {status, status == Status::TooManyColors ? kReduceHint : "", {}, false};
     }
@@ -254,6 +258,7 @@ class Conversion {
   const CommandContext& context_;
   const int32_t rowIndex_;
   const FormatEntry& row_;
+  const std::string extension_;
   const std::vector<SelectedFile>& files_;
   OutputNames names_;
   ResultOutput output_;

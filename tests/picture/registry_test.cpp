@@ -63,43 +63,26 @@ TEST(FindFormat, FirstRowThatMatchesWins) {
   }
 }
 
-TEST(FindFormat, PlugInsAreAskedLast) {
-  InstallPluginFallback([](std::string_view name, int32_t parameter) {
-    return name == "x.heic" && parameter == 5 ? kSpareRow : kNoFormat;
-  });
+TEST(FindFormat, PlugInsAreAskedLastAndListedLast) {
+  const size_t filter = OpenFileFilter().size(), destinations = DestinationExtensions().size();
+  constexpr PluginSource kSource{
+      [](std::string_view name, int32_t parameter) {
+        return name == "x.heic" && parameter == 5 ? kSpareRow : kNoFormat;
+      },
+      [] {
+        return std::vector<PluginFormatFacts>{{"HEIC", "", 24, false}, {"QOI", "Quite OK", 24, true}};
+      }};
+  InstallPluginSource(&kSource);
   EXPECT_EQ(FindFormatByName("x.heic", 5), kSpareRow);
   EXPECT_EQ(FindFormatByName("x.heic", 4), kNoFormat);
   EXPECT_EQ(FindFormatByName("x.bmp", 5), 2);
-  InstallPluginFallback(nullptr);
+  EXPECT_EQ(OpenFileFilter().size(), filter + 2);
+  EXPECT_EQ(OpenFileFilter().back().description, "(QOI) Plugin Quite OK");
+  EXPECT_EQ(DestinationExtensions().size(), destinations + 1);
+  EXPECT_EQ(DestinationExtensions().back(), "qoi");
+  InstallPluginSource(nullptr);
   EXPECT_EQ(FindFormatByName("x.heic", 5), kNoFormat);
-}
-
-// Gives the spare row a plug-in's texts until the test ends.
-class FilledSpareRow {
- public:
-  FilledSpareRow() : saved_(FormatRow(kSpareRow)) {
-    FormatEntry& row = FormatRow(kSpareRow);
-    row.extension.AssignCut("HEIC");
-    row.description.AssignCut("(HEIC) High efficiency");
-    row.enabled = 1;
-    row.flags = FMT_BITMAP;
-  }
-  ~FilledSpareRow() { FormatRow(kSpareRow) = saved_; }
-
- private:
-  FormatEntry saved_;
-};
-
-TEST(FormatLists, SpareRowShowsOnlyWhenAPlugInHasIt) {
-  const size_t filter = OpenFileFilter().size(), list = FormatListRows().size(),
-               destinations = DestinationRows().size();
-  EXPECT_EQ(DescribeFileType("x.heic"), "(HEIC) HEIC file");
-  const FilledSpareRow filled;
-  EXPECT_EQ(FindFormatByName("x.heic"), kSpareRow);
-  EXPECT_EQ(DescribeFileType("x.heic"), "(HEIC) High efficiency");
-  EXPECT_EQ(OpenFileFilter().size(), filter + 1);
-  EXPECT_EQ(FormatListRows().size(), list + 1);
-  EXPECT_EQ(DestinationRows().size(), destinations + 1);
+  EXPECT_EQ(OpenFileFilter().size(), filter);
 }
 
 TEST(FormatLists, LeaveOutWhatTheirFlagsSay) {
