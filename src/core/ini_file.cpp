@@ -14,18 +14,17 @@ constexpr std::string_view kBlanks = " \t";
 
 struct Line {
   std::string_view text;  // without its end
-  std::string_view end;   // "\n", "\r\n", or nothing at the end of the file
+  std::string_view end;   // "\n", "\r\n"; at the end of the file also "\r" or nothing
 };
 
 // Takes the next line off the text.
 Line TakeLine(std::string_view& rest) {
   const size_t feed = rest.find('\n');
-  Line line{rest.substr(0, feed), feed == std::string_view::npos ? std::string_view() : rest.substr(feed, 1)};
-  if (!line.end.empty() && line.text.ends_with('\r')) {
-    line.end = rest.substr(feed - 1, 2);
-    line.text.remove_suffix(1);
-  }
-  rest.remove_prefix(line.text.size() + line.end.size());
+  const size_t size = feed == std::string_view::npos ? rest.size() : feed + 1;
+  size_t length = std::min(feed, rest.size());
+  if (length > 0 && rest[length - 1] == '\r') --length;
+  const Line line{rest.substr(0, length), rest.substr(length, size - length)};
+  rest.remove_prefix(size);
   return line;
 }
 
@@ -70,7 +69,7 @@ class IniEditor {
 
  private:
   void CopyLine(const Line& line) {
-    if (lineEnd_.empty()) lineEnd_ = line.end;
+    if (lineEnd_.empty() && line.end.ends_with('\n')) lineEnd_ = line.end;
     if (const auto name = SectionOf(line.text)) {
       if (inside_ && !placeFound_) RememberPlace();
       inside_ = *name == section_;
@@ -119,7 +118,11 @@ class IniEditor {
       place_ = out_.size();
       lines.insert(0, std::string("[").append(section_).append("]").append(lineEnd_));
     }
-    if (place_ > 0 && out_[place_ - 1] != '\n') lines.insert(0, lineEnd_);
+    if (place_ > 0 && out_[place_ - 1] == '\r') {
+      lines.insert(0, 1, '\n');
+    } else if (place_ > 0 && out_[place_ - 1] != '\n') {
+      lines.insert(0, lineEnd_);
+    }
     out_.insert(place_, lines);
   }
 

@@ -52,6 +52,17 @@ constexpr size_t kLimits[] = {
 #undef SETTING
 };
 
+// Length and last letter of a name: what a search looks at before it compares names.
+constexpr uint16_t TagOf(std::string_view name) {
+  return static_cast<uint16_t>((name.size() << 8) | (name.empty() ? 0 : static_cast<unsigned char>(name.back())));
+}
+
+constexpr uint16_t kTags[] = {
+#define SETTING(kind, key, control, extra, value) TagOf(#key),
+#include "core/settings.def"
+#undef SETTING
+};
+
 template <size_t capacity>
 constexpr void* VariableOf(FixedText<capacity>& text) { return text.data(); }
 constexpr void* VariableOf(int32_t& number) { return &number; }
@@ -109,11 +120,16 @@ size_t NumberOfKey(const KeyRow& row) {
 }
 
 const KeyRow* FindKey(std::string_view name, size_t from) {
-  for (size_t step = 0; step < kKeyCount; ++step) {
-    const KeyRow& row = keyTable.rows[(from + step) % kKeyCount];
-    if (name == row.name) return &row;
-  }
-  return nullptr;
+  const uint16_t tag = TagOf(name);
+  const auto find = [&](size_t first, size_t end) -> const KeyRow* {
+    for (size_t i = first; i < end; ++i) {
+      if (kTags[i] == tag && name == keyTable.rows[i].name) return &keyTable.rows[i];
+    }
+    return nullptr;
+  };
+  from = std::min(from, kKeyCount);
+  const KeyRow* const found = find(from, kKeyCount);
+  return found != nullptr ? found : find(0, from);
 }
 
 const KeyRow* FindKeyOfControl(uint32_t control) {
