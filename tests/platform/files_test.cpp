@@ -8,6 +8,7 @@
 #include <thread>
 
 #include "platform/paths.h"
+#include "platform/posix/handle.h"
 #include "support/faults.h"
 #include "support/files.h"
 
@@ -150,11 +151,27 @@ TEST_F(FilesTest, DeletesFilesAndLinksNeverFolders) {
   EXPECT_THAT(folder_.Names(), ElementsAre("folder", "regular"));
 }
 
+constexpr RefusingRename allWays[] = {RefusingRename::Directly, RefusingRename::ByLink, RefusingRename::ByPlaceholder};
+
 TEST_F(FilesTest, RenamesAsAsked) {
   WriteText(Path("new"), "new");
-  for (const char* taken : {"regular", "folder", "fifo", "to nothing", "to regular"}) {
-    EXPECT_EQ(RenameFile(Path("new"), Path(taken), Existing::Refuse), CommitResult::Taken) << taken;
+  for (const RefusingRename way : allWays) {
+    SCOPED_TRACE(static_cast<int>(way));
+    refusingRename = way;
+    for (const char* taken : {"regular", "folder", "fifo", "to nothing", "to regular"}) {
+      EXPECT_EQ(RenameFile(Path("new"), Path(taken), Existing::Refuse), CommitResult::Taken) << taken;
+    }
+    EXPECT_EQ(RenameFile(Path("new"), Path("none/x"), Existing::Refuse), CommitResult::Failed);
+    EXPECT_EQ(RenameFile(Path("missing"), Path("free"), Existing::Refuse), CommitResult::Failed);
+    EXPECT_FALSE(FileExists(Path("free")));
+    EXPECT_EQ(RenameFile(Path("new"), Path("free"), Existing::Refuse), CommitResult::Done);
+    EXPECT_FALSE(FileExists(Path("new")));
+    EXPECT_EQ(RenameFile(Path("free"), Path("new"), Existing::Refuse), CommitResult::Done);
+    EXPECT_EQ(ReadText(Path("new")), "new");
   }
+  refusingRename = RefusingRename::Directly;
+  EXPECT_EQ(RenameFile(Path("folder"), Path("free"), Existing::Refuse), CommitResult::Done);
+  EXPECT_EQ(RenameFile(Path("free"), Path("folder"), Existing::Refuse), CommitResult::Done);
   for (const char* other : {"folder", "fifo", "none/x"}) {
     EXPECT_EQ(RenameFile(Path("new"), Path(other), Existing::Replace), CommitResult::Failed) << other;
   }
@@ -170,8 +187,9 @@ TEST_F(FilesTest, RenamesAsAsked) {
 
 TEST(Files, OneWinsARaceForAName) {
   const TemporaryFolder folder;
-  constexpr int kRunners = 4, kRounds = 50;
+  constexpr int kRunners = 4, kRounds = 60;
   for (int round = 0; round < kRounds; ++round) {
+    refusingRename = allWays[round % 3];
     for (int i = 0; i < kRunners; ++i) WriteText(folder.Path(std::to_string(i)), std::to_string(i));
     CommitResult results[kRunners];
     std::vector<std::thread> runners;
@@ -186,6 +204,7 @@ TEST(Files, OneWinsARaceForAName) {
     EXPECT_EQ(folder.Names().size(), static_cast<size_t>(kRunners));  // the losers keep theirs
     ASSERT_TRUE(DeleteFile(folder.Path("name")));
   }
+  refusingRename = RefusingRename::Directly;
 }
 
 TEST_F(FilesTest, AttributesAndTimes) {

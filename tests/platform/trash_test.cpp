@@ -112,10 +112,12 @@ TEST_F(TrashTest, LeavesNothingBehindWhenItCannot) {
 
 // Mounts a small volume of its own at `folder`, seen by this process alone. False where that is not allowed.
 bool MountVolume(const std::string& folder) {
-  const std::string map = std::to_string(getuid()) + " " + std::to_string(getuid()) + " 1";
+  const std::string user = std::to_string(getuid()), group = std::to_string(getgid());
   if (unshare(CLONE_NEWNS) != 0) {
     if (unshare(CLONE_NEWUSER | CLONE_NEWNS) != 0) return false;
-    WriteText("/proc/self/uid_map", map);
+    WriteText("/proc/self/setgroups", "deny");
+    WriteText("/proc/self/uid_map", user + " " + user + " 1");
+    WriteText("/proc/self/gid_map", group + " " + group + " 1");
   }
   return mount("none", "/", nullptr, MS_REC | MS_PRIVATE, nullptr) == 0 &&
          mount("none", folder.c_str(), "tmpfs", 0, "size=1m") == 0;

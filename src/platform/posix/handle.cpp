@@ -11,6 +11,8 @@
 
 namespace fotomill::platform {
 
+std::atomic<RefusingRename> refusingRename{RefusingRename::Directly};
+
 namespace {
 
 constexpr uint64_t kMostAtOnce = uint64_t{1} << 30;  // one read or write; the system takes at most 2 GiB
@@ -23,6 +25,7 @@ bool OneEntry(const std::string& from, const std::string& to) {
          first.st_ino == second.st_ino && first.st_nlink == 1 && from != to;
 }
 
+// The two ways below are for files: a folder has no hard links, and nothing else can hold its name.
 CommitResult RenameByLink(const std::string& from, const std::string& to) {
   if (linkat(AT_FDCWD, from.c_str(), AT_FDCWD, to.c_str(), 0) != 0) {
     return errno == EEXIST ? CommitResult::Taken : CommitResult::Failed;
@@ -115,17 +118,21 @@ void SyncFolderOf(const std::string& path) {
 }
 
 CommitResult RenameRefusing(const std::string& from, const std::string& to) {
-  if (renameat2(AT_FDCWD, from.c_str(), AT_FDCWD, to.c_str(), RENAME_NOREPLACE) == 0) return CommitResult::Done;
-  if (errno == EEXIST && OneEntry(from, to)) {
-    return std::rename(from.c_str(), to.c_str()) == 0 ? CommitResult::Done : CommitResult::Failed;
+  const RefusingRename first = refusingRename;
+  errno = ENOSYS;
+  if (first == RefusingRename::Directly) {
+    if (renameat2(AT_FDCWD, from.c_str(), AT_FDCWD, to.c_str(), RENAME_NOREPLACE) == 0) return CommitResult::Done;
+    if (errno == EEXIST && OneEntry(from, to)) {
+      return std::rename(from.c_str(), to.c_str()) == 0 ? CommitResult::Done : CommitResult::Failed;
+    }
+    if (errno == EEXIST) return CommitResult::Taken;
+    if (errno != EINVAL && errno != ENOSYS && errno != EOPNOTSUPP) return CommitResult::Failed;
   }
-  if (errno == EEXIST) return CommitResult::Taken;
-  if (errno != EINVAL && errno != ENOSYS && errno != EOPNOTSUPP) return CommitResult::Failed;
-  const CommitResult result = RenameByLink(from, to);
-  if (result == CommitResult::Failed && (errno == EPERM || errno == EOPNOTSUPP || errno == ENOSYS)) {
-    return RenameOverPlaceholder(from, to);
+  if (first != RefusingRename::ByPlaceholder) {
+    const CommitResult result = RenameByLink(from, to);
+    if (result != CommitResult::Failed || (errno != EPERM && errno != EOPNOTSUPP && errno != ENOSYS)) return result;
   }
-  return result;
+  return RenameOverPlaceholder(from, to);
 }
 
 }  // namespace fotomill::platform

@@ -63,5 +63,8 @@ void SyncFolderOf(const std::string& path);
 // Gives `from` the name `to` unless that is taken, in one step: by the rename that refuses, else by a hard link, else (file
 // systems that know neither) by taking the name with an empty file first.
 CommitResult RenameRefusing(const std::string& from, const std::string& to);
+// The first of these ways that is tried; tests begin further down than the system would need to.
+enum class RefusingRename { Directly, ByLink, ByPlaceholder };
+extern std::atomic<RefusingRename> refusingRename;
 
 }  // namespace fotomill::platform
