@@ -9,6 +9,7 @@
 #include "formats/fits.h"
 #include "formats/mac.h"
 #include "formats/pcx.h"
+#include "formats/png.h"
 #include "formats/xbm.h"
 #include "platform/paths.h"
 
@@ -100,7 +101,7 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"PIC", "(PIC) GLPaint/Pegasus", 1, 24, FMT_BITMAP,
      nullptr, NoInfo, NoRead, NoWrite},
     {"PNG", "(PNG) Portable Network Graphics", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_PAGES | FMT_FRAMES | FMT_PNG | FMT_LAYERED | FMT_TRANSPARENT | FMT_SAVE_ANYWAY | FMT_ALPHA,
-     NoDetails, NoInfo, NoRead, NoWrite},
+     PngDetails, PngInfo, PngRead, PngWrite},
     {"PSD", "(PSD) Adobe Photoshop 2.5", 1, 24, FMT_BITMAP,
      nullptr, NoInfo, NoRead, NoWrite},
     {"RAS", "(RAS) Sun Raster", 1, 24, FMT_BITMAP,

@@ -1,0 +1,22 @@
+#pragma once
+
+#include <span>
+
+#include "picture/picture_record.h"
+#include "picture/write_options.h"
+
+namespace fotomill {
+
+// Portable Network Graphics. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when the file is cut short,
+// MemoryAllocationError (6).
+Status PngInfo(PictureRecord& picture, const char* fileName, uint32_t flags);
+Status PngRead(PictureRecord& picture, const char* fileName);
+// Also ErrorCreatingFile (10), ErrorWritingFile (11).
+Status PngWrite(PictureRecord& picture, const WriteOptions& options);
+Status PngDetails(PictureRecord& picture);
+
+// The same for a file that lies in memory, as containers hold them. Statuses as above.
+Status DescribePng(std::span<const uint8_t> file, PictureRecord& picture);
+Status DecodePng(std::span<const uint8_t> file, PictureRecord& picture);
+
+}  // namespace fotomill
