@@ -7,9 +7,11 @@
 #include "core/text.h"
 #include "formats/bmp.h"
 #include "formats/fits.h"
+#include "formats/gif.h"
 #include "formats/mac.h"
 #include "formats/pcx.h"
 #include "formats/png.h"
+#include "formats/tga.h"
 #include "formats/xbm.h"
 #include "platform/paths.h"
 
@@ -71,7 +73,7 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"FIT", "(FIT) Flexible Image Transport", 1, 24, FMT_BITMAP,
      FitsDetails, FitsInfo, FitsRead, FitsWrite},
     {"GIF", "(GIF) CompuServe", 1, 8, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_PAGES | FMT_TIMED | FMT_FRAMES | FMT_LAYERED | FMT_TRANSPARENT,
-     NoDetails, NoInfo, NoRead, NoWrite},
+     GifDetails, GifInfo, GifRead, GifWrite},
     {"HDP", "(HDP) HD Photo", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_FRAMES | FMT_LAYERED,
      NoDetails, NoInfo, NoRead, NoWrite},
     {"HRZ", "(HRZ) SSTV", 1, 24, FMT_BITMAP,
@@ -115,7 +117,7 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"SWF", "(SWF) Flash", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_TIMED | FMT_FRAMES | FMT_LAYERED | FMT_TRANSPARENT | FMT_FLASH,
      NoDetails, NoInfo, NoRead, NoWrite},
     {"TGA", "(TGA) Targa", 1, 24, FMT_BITMAP | FMT_ALPHA,
-     nullptr, NoInfo, NoRead, NoWrite},
+     nullptr, TgaInfo, TgaRead, TgaWrite},
     {"TIF", "(TIF) TIFF", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_LAYERED | FMT_ALPHA,
      NoDetails, NoInfo, NoRead, NoWrite},
     {"TXT", "(TXT) Text files", 1, 24, FMT_BITMAP,

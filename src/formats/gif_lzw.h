@@ -1,0 +1,49 @@
+#pragma once
+
+#include <cstdint>
+#include <span>
+
+#include "core/byte_reader.h"
+#include "core/byte_writer.h"
+#include "core/status.h"
+
+namespace fotomill {
+
+// The variable-length-code LZW of GIF: codes of up to 12 bits, least significant bit first, in sub-blocks of up to 255
+// bytes that end in an empty one. The first byte is the number of bits of a pixel, from 2 to 8.
+
+// Decodes pixels.size() indices from `bytes`, which stands at the first byte. Ok as soon as all pixels are there, whether
+// or not an end code follows; the reader is then left somewhere in the data. DamagedFile for a code that cannot be or a
+// pixel size outside 1 to 8, FileReadError when the data end too early.
+Status DecodeGifPixels(ByteReader& bytes, std::span<uint8_t> pixels);
+
+// Encodes indices of `bits` per pixel (1 to 8), handed over piece by piece in any lengths.
+class GifPixelEncoder {
+ public:
+  GifPixelEncoder(ByteWriter& out, int32_t bits);
+  void Add(std::span<const uint8_t> pixels);
+  // Writes what is pending, the end code and the empty block.
+  void Finish();
+
+ private:
+  static constexpr uint32_t kTableSize = 16384;  // four times the codes, so that probes are short
+  static constexpr int32_t kNone = -1;
+
+  void PutCode(uint32_t code);
+  void FlushBytes(bool all);
+  void ClearTable();
+
+  ByteWriter& out_;
+  const uint32_t clearCode_;
+  uint32_t codeBits_ = 0;
+  uint32_t nextCode_ = 0;
+  int32_t prefix_ = kNone;      // code of the string read so far
+  uint64_t pending_ = 0;        // bits not yet written, the oldest lowest
+  uint32_t pendingBits_ = 0;
+  uint8_t block_[255];
+  size_t blockSize_ = 0;
+  uint32_t keys_[kTableSize];   // (prefix << 8 | pixel) + 1, 0 free
+  uint16_t codes_[kTableSize];
+};
+
+}  // namespace fotomill
