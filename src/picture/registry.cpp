@@ -8,6 +8,7 @@
 #include "formats/bmp.h"
 #include "formats/fits.h"
 #include "formats/gif.h"
+#include "formats/ico.h"
 #include "formats/mac.h"
 #include "formats/pcx.h"
 #include "formats/png.h"
@@ -79,7 +80,7 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"HRZ", "(HRZ) SSTV", 1, 24, FMT_BITMAP,
      nullptr, NoInfo, NoRead, NoWrite},
     {"ICO", "(ICO) Windows icon", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_CONTAINER | FMT_LAYERED | FMT_TRANSPARENT | FMT_ALPHA,
-     nullptr, NoInfo, NoRead, NoWrite},
+     nullptr, IcoInfo, IcoRead, IcoWrite},
     {"IFF", "(IFF) Amiga", 1, 24, FMT_BITMAP,
      NoDetails, NoInfo, NoRead, NoWrite},
     {"IMG", "(IMG) GEM/Ventura", 1, 24, FMT_BITMAP,
@@ -159,7 +160,7 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"FTS", "(FTS) Flex. Image Transport", 1, 24, FMT_BITMAP | FMT_SECONDARY,
      FitsDetails, FitsInfo, FitsRead, FitsWrite},
     {"CUR", "(CUR) Windows cursor", 1, 24, FMT_BITMAP | FMT_SECONDARY | FMT_ALPHA,
-     nullptr, NoInfo, NoRead, NoWrite},
+     nullptr, IcoInfo, IcoRead, IcoWrite},
     {"HAM", "(HAM) Amiga", 1, 24, FMT_BITMAP | FMT_SECONDARY,
      NoDetails, NoInfo, NoRead, NoWrite},
     {"JFI", "(JFI) Jpeg", 0, 24, FMT_BITMAP | FMT_SECONDARY,

@@ -1,0 +1,17 @@
+#pragma once
+
+#include "picture/picture_record.h"
+#include "picture/write_options.h"
+
+namespace fotomill {
+
+// Windows icons and cursors. `picture.page` above 0 selects an entry in the order of the file, counted from 1; 0 takes the
+// best one. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when an entry is cut short,
+// MemoryAllocationError (6), UnsupportedFormat (8) for a compressed bitmap, NoImages (20) for an empty file.
+Status IcoInfo(PictureRecord& picture, const char* fileName, uint32_t flags);
+Status IcoRead(PictureRecord& picture, const char* fileName);
+// Writes one entry; a cursor when the extension is "cur". Also UnsuitableImage (13) for sides over 256,
+// ErrorCreatingFile (10), ErrorWritingFile (11).
+Status IcoWrite(PictureRecord& picture, const WriteOptions& options);
+
+}  // namespace fotomill
