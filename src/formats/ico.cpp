@@ -20,7 +20,8 @@
 // 24 bits with an alpha plane. The fourth byte of 32-bit pixels is alpha unless it is 0 everywhere, as old programs left
 // it; then the mask counts. A mask that the file lacks is opaque.
 //
-// The writer stores one bitmap with its mask; 24 bits with an alpha plane as 32. ICOCompression asks for PNG instead.
+// The writer stores one bitmap with its mask; 24 bits with an alpha plane as 32. ICOCompression asks for a PNG file
+// instead, for 256 x 256 pixels or for every size.
 // Source: Microsoft, "Icons in Win32" (J. Hornick, 1995); "The evolution of the ICO file format" (R. Chen, 2010).
 #include "formats/ico.h"
 
@@ -30,7 +31,10 @@
 
 #include "core/byte_reader.h"
 #include "core/byte_writer.h"
+#include "core/choice_lists.h"
+#include "core/settings.h"
 #include "core/text.h"
+#include "formats/png.h"
 #include "platform/file_view.h"
 #include "platform/paths.h"
 
@@ -42,6 +46,7 @@ constexpr uint16_t kIcons = 1, kCursors = 2;
 constexpr uint32_t kInfoSize = 40;
 constexpr int32_t kMostSide = 256;
 constexpr uint32_t kFileHeaderSize = 6, kEntrySize = 16;
+constexpr uint32_t kSizeOffset = kFileHeaderSize + 8;  // of the first entry's size
 
 struct IcoEntry {
   uint16_t hotSpotX = 0, hotSpotY = 0;  // of a cursor
@@ -219,6 +224,21 @@ Status ReadBitmap(const IcoBitmap& bitmap, PictureRecord& picture, PackedImage& 
   return Status::Ok;
 }
 
+// A PNG entry is a whole file of its own; the names and pages of the icon stay.
+Status LoadPngEntry(std::span<const uint8_t> entry, PictureRecord& picture, PackedImage* image, PackedImage* alpha) {
+  const FixedText<64> typeName = picture.typeName;
+  const int32_t pages = picture.pageCount;
+  const Status status = image == nullptr ? DescribePng(entry, picture) : DecodePng(entry, picture);
+  picture.typeName = typeName;
+  picture.pageCount = pages;
+  RETURN_IF_BAD(status);
+  if (image != nullptr) {
+    *image = std::move(picture.image);
+    *alpha = std::move(picture.alpha);
+  }
+  return Status::Ok;
+}
+
 // Facts, and with `image` the pixels, of the entry that the picture's page selects.
 Status LoadEntry(const IcoFile& icons, PictureRecord& picture, PackedImage* image, PackedImage* alpha) {
   const IcoEntry* entry = ChooseEntry(icons, picture.page);
@@ -227,7 +247,7 @@ Status LoadEntry(const IcoFile& icons, PictureRecord& picture, PackedImage* imag
   picture.pageCount = static_cast<int32_t>(icons.entries.size());
   picture.hotSpotX = icons.cursors ? entry->hotSpotX : 0;
   picture.hotSpotY = icons.cursors ? entry->hotSpotY : 0;
-  if (IsPng(entry->bytes)) return Status::UnsupportedFormat;
+  if (IsPng(entry->bytes)) return LoadPngEntry(entry->bytes, picture, image, alpha);
   IcoBitmap bitmap;
   RETURN_IF_BAD(ParseBitmap(entry->bytes, bitmap));
   DescribeBitmap(bitmap, picture);
@@ -241,6 +261,7 @@ struct IcoLayout {
   uint32_t colors = 0;
   uint32_t colorBytes = 0, maskBytes = 0;
   bool cursor = false;
+  bool png = false;
 
   uint32_t PictureSize() const { return kInfoSize + 4 * colors + colorBytes + maskBytes; }
 };
@@ -253,6 +274,8 @@ IcoLayout ChooseLayout(const PictureRecord& picture) {
   layout.colorBytes = static_cast<uint32_t>(RowStride(image.Width(), layout.bits)) * static_cast<uint32_t>(image.Height());
   layout.maskBytes = static_cast<uint32_t>(RowStride(image.Width(), 1)) * static_cast<uint32_t>(image.Height());
   layout.cursor = EqualIgnoringCase(platform::ExtensionOf(picture.fileName), "cur");
+  const bool fullSize = image.Width() == kMostSide && image.Height() == kMostSide;
+  layout.png = settings.ICOCompression == choice::kIconPngAlways || (settings.ICOCompression == choice::kIconPng256 && fullSize);
   return layout;
 }
 
@@ -353,9 +376,14 @@ Status IcoWrite(PictureRecord& picture, const WriteOptions& options) {
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
   const IcoLayout layout = ChooseLayout(picture);
   WriteDirectory(out, picture, layout);
-  WriteBitmapHeader(out, picture, layout);
-  WriteColors(out, picture, layout);
-  WriteMask(out, picture);
+  if (layout.png) {
+    RETURN_IF_BAD(EncodePng(picture, out));
+    out.PatchLe32(kSizeOffset, static_cast<uint32_t>(out.Position()) - kFileHeaderSize - kEntrySize);
+  } else {
+    WriteBitmapHeader(out, picture, layout);
+    WriteColors(out, picture, layout);
+    WriteMask(out, picture);
+  }
   return CommitOutput(out, options);
 }
 

@@ -297,7 +297,7 @@ Status ReadPixels(PngReader& reader, const PngLayout& layout, PictureRecord& pic
 
 // A file being written.
 struct PngWriter {
-  PngWriter() {
+  explicit PngWriter(ByteWriter& target) : out(target) {
     png = png_create_write_struct(PNG_LIBPNG_VER_STRING, nullptr, OnError, OnWarning);
     if (png != nullptr) info = png_create_info_struct(png);
   }
@@ -306,7 +306,7 @@ struct PngWriter {
   PngWriter& operator=(const PngWriter&) = delete;
   bool Ready() const { return info != nullptr; }
 
-  ByteWriter out;
+  ByteWriter& out;
   png_structp png = nullptr;
   png_infop info = nullptr;
 };
@@ -383,9 +383,9 @@ void MergeAlpha(const uint8_t* color, const uint8_t* alpha, uint8_t* target, int
   }
 }
 
-Status WriteAll(PngWriter& writer, const PictureRecord& picture, const WriteOptions& options) {
+// `keep`: whether metadata and comment go along.
+Status WriteAll(PngWriter& writer, const PictureRecord& picture, bool keep) {
   const PackedImage& image = picture.image;
-  const bool keep = options.keepMetadata && settings.PreserveEXIF != 0;
   const std::string xmp(picture.metadata.xmp.begin(), picture.metadata.xmp.end());
   const std::string comment(picture.comment.begin(), picture.comment.end());
   std::vector<uint8_t> merged(picture.alpha.Empty() ? 0 : 4 * static_cast<size_t>(image.Width()));
@@ -394,7 +394,7 @@ Status WriteAll(PngWriter& writer, const PictureRecord& picture, const WriteOpti
     SetHeader(writer, picture);
     SetMetadata(writer, picture, keep);
     if (keep && !xmp.empty()) SetText(writer, kXmpKeyword, xmp);
-    if (!comment.empty()) SetText(writer, "Comment", comment);
+    if (keep && !comment.empty()) SetText(writer, "Comment", comment);
     png_write_info(writer.png, writer.info);
     if (image.Bits() == 24) png_set_bgr(writer.png);
     for (int32_t y = 0; y < image.Height(); ++y) {
@@ -479,6 +479,12 @@ Status DecodePng(std::span<const uint8_t> file, PictureRecord& picture) {
   return ReadPixels(reader, layout, picture);
 }
 
+Status EncodePng(const PictureRecord& picture, ByteWriter& out) {
+  PngWriter writer(out);
+  if (!writer.Ready()) return Status::MemoryAllocationError;
+  return WriteAll(writer, picture, false);
+}
+
 Status PngInfo(PictureRecord& picture, const char* fileName, uint32_t) {
   picture.typeName.Clear();
   platform::FileView file;
@@ -499,11 +505,12 @@ Status PngRead(PictureRecord& picture, const char* fileName) {
 Status PngWrite(PictureRecord& picture, const WriteOptions& options) {
   const ProgressScope progress(picture);
   if (picture.image.Empty()) return Status::MemoryAllocationError;
-  PngWriter writer;
+  ByteWriter out;
+  if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
+  PngWriter writer(out);
   if (!writer.Ready()) return Status::MemoryAllocationError;
-  if (!writer.out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
-  RETURN_IF_BAD(WriteAll(writer, picture, options));
-  return CommitOutput(writer.out, options);
+  RETURN_IF_BAD(WriteAll(writer, picture, options.keepMetadata && settings.PreserveEXIF != 0));
+  return CommitOutput(out, options);
 }
 
 Status PngDetails(PictureRecord& picture) {

@@ -2,6 +2,7 @@
 
 #include <span>
 
+#include "core/byte_writer.h"
 #include "picture/picture_record.h"
 #include "picture/write_options.h"
 
@@ -18,5 +19,7 @@ Status PngDetails(PictureRecord& picture);
 // The same for a file that lies in memory, as containers hold them. Statuses as above.
 Status DescribePng(std::span<const uint8_t> file, PictureRecord& picture);
 Status DecodePng(std::span<const uint8_t> file, PictureRecord& picture);
+// Appends a PNG file of the picture's pixels, without metadata, to `out`.
+Status EncodePng(const PictureRecord& picture, ByteWriter& out);
 
 }  // namespace fotomill
