@@ -65,10 +65,13 @@ bool FindKeys(const CommandContext& context, std::vector<const KeyRow*>& rows) {
   return true;
 }
 
+void NoteUnreadable(const CommandContext& context) {
+  if (StateOfConfiguration() != ConfigurationState::Unreadable) return;
+  PrintProblem(context, "The configuration file cannot be read; the defaults stand.");
+}
+
 int RunList(const ConfigOptions& options, const CommandContext& context) {
-  if (StateOfConfiguration() == ConfigurationState::Unreadable) {
-    PrintProblem(context, "The configuration file cannot be read; these are the defaults.");
-  }
+  NoteUnreadable(context);
   ResultOutput output(context, options.json);
   for (const KeyRow& row : Keys()) {
     if (options.changed && (IsAtDefault(row) || (row.type & KEY_INTERNAL) != 0)) continue;
@@ -84,6 +87,7 @@ int RunList(const ConfigOptions& options, const CommandContext& context) {
 int RunGet(const ConfigOptions& options, const CommandContext& context) {
   std::vector<const KeyRow*> rows;
   if (!FindKeys(context, rows)) return kExitUsage;
+  NoteUnreadable(context);
   ResultOutput output(context, options.json);
   for (const KeyRow* row : rows) {
     if (output.IsJson()) {

@@ -196,6 +196,7 @@ TEST_F(ConfigurationTest, ValuesForOneRunAreNotWritten) {
       {"JpegCompresion", "90", SetResult::UnknownKey, "There is no key \"JpegCompresion\"; the nearest is JpegCompression."},
       {"writeos2bitmaps", "1", SetResult::UnknownKey, "There is no key \"writeos2bitmaps\"; the nearest is WriteOS2Bitmaps."},
       {"JpegCompression", "101", SetResult::WrongValue, "JpegCompression takes a number from 0 to 100."},
+      {"TiffResolution", "0", SetResult::WrongValue, "TiffResolution takes a number from 1 to 32767."},
       {"JpegCompression", "many", SetResult::WrongValue, "JpegCompression takes a whole number."},
       {"WriteOS2Bitmaps", "2", SetResult::WrongValue, "WriteOS2Bitmaps takes 0 or 1."},
       {"ExtensionCaseStyle", "3", SetResult::WrongValue,

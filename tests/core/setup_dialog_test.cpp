@@ -3,10 +3,11 @@
 #include <gtest/gtest.h>
 
 #include <map>
-#include <set>
 
 #include "core/configuration.h"
+#include "core/data_folder.h"
 #include "core/settings.h"
+#include "support/files.h"
 #include "support/scoped_settings.h"
 
 namespace fotomill {
@@ -130,6 +131,22 @@ TEST_F(SetupDialogTest, TakesUpWhatWasChanged) {
   dialog.At(FileTipDelay).checked = true;
   ASSERT_FALSE(Read());
   EXPECT_EQ(settings.FileTipDelay, 500) << "on again is the default number";
+}
+
+TEST_F(SetupDialogTest, WhatIsChosenIsSavedWhateverTheCommandLineSaid) {
+  const test::TemporaryFolder folder;
+  SetDataFolder(folder.Path());
+  LoadConfiguration();
+  ASSERT_TRUE(SetSetting("JpegCompression", "10").Ok());
+  ASSERT_TRUE(SetSetting("UndoLevels", "20").Ok());
+  FakeDialog& dialog = Filled({JpegCompression, UndoLevels});
+  dialog.At(JpegCompression).text = "30";
+  ASSERT_FALSE(Read());
+  EXPECT_EQ(SaveConfiguration(), SaveResult::Done);
+  EXPECT_EQ(test::ReadText(ConfigurationPath()), "[Fotomill]\nJpegCompression=30\n");
+  SetDataFolder(folder.Path("none"));
+  LoadConfiguration();
+  SetDataFolder({});
 }
 
 TEST_F(SetupDialogTest, RefusesAllWhenOneIsWrong) {
