@@ -46,6 +46,7 @@
 #include "core/settings.h"
 #include "core/text.h"
 #include "platform/file_view.h"
+#include "processing/pixel_rows.h"
 
 namespace fotomill {
 
@@ -56,7 +57,7 @@ constexpr uint64_t kOs2HeaderSize = 26;
 constexpr uint32_t kOs2InfoSize = 12;
 constexpr uint32_t kWindowsInfoSize = 40;
 constexpr uint64_t kMasksSize = 12;
-constexpr uint64_t kChunkSize = 1 << 20;  // rows are read and written in pieces of about this many bytes
+constexpr uint64_t kChunkSize = 16 << 20;  // rows are read and written in pieces of about this many bytes
 
 constexpr uint32_t kRle8 = 1, kRle4 = 2, kBitFields = 3;
 
@@ -186,13 +187,14 @@ void ReadRow555(std::span<const uint8_t> source, int32_t width, std::span<uint8_
 
 void ReadRow32(std::span<const uint8_t> source, int32_t width, std::span<uint8_t> row, std::span<uint8_t>) {
   const size_t count = static_cast<size_t>(width);
-  for (size_t x = 0; x < count; ++x) std::memcpy(row.data() + 3 * x, source.data() + 4 * x, 3);
+  DropFourth(source.data(), count, row.data());
   std::memset(row.data() + 3 * count, 0, row.size() - 3 * count);
 }
 
 void ReadRow32Alpha(std::span<const uint8_t> source, int32_t width, std::span<uint8_t> row, std::span<uint8_t> alpha) {
-  ReadRow32(source, width, row, alpha);
-  for (size_t x = 0; x < static_cast<size_t>(width); ++x) alpha[x] = source[4 * x + 3];
+  const size_t count = static_cast<size_t>(width);
+  SplitAlpha(source.data(), count, row.data(), alpha.data());
+  std::memset(row.data() + 3 * count, 0, row.size() - 3 * count);
 }
 
 // Whether the masks after the header are those of 5-6-5 pixels. FileReadError when the file ends within them.
@@ -417,12 +419,9 @@ void WriteRowsWithAlpha(ByteWriter& out, const PictureRecord& picture) {
     const uint8_t* alpha = picture.alpha.StoredRow(r).data();
     for (int32_t x = 0; x < width; x += kPiece) {
       const int32_t end = std::min(x + kPiece, width);
-      uint8_t* place = out.Reserve(4 * static_cast<size_t>(end - x));
-      for (int32_t i = x; i < end; ++i, place += 4, color += 3) {
-        std::memcpy(place, color, 3);
-        place[3] = alpha[i];
-      }
-      out.Used(4 * static_cast<size_t>(end - x));
+      const size_t count = static_cast<size_t>(end - x);
+      MergeAlpha(color + 3 * x, alpha + x, count, out.Reserve(4 * count));
+      out.Used(4 * count);
     }
   }
 }

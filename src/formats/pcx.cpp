@@ -30,7 +30,9 @@
 
 #include "core/byte_reader.h"
 #include "core/byte_writer.h"
+#include "formats/pcx_runs.h"
 #include "platform/file_view.h"
+#include "processing/pixel_rows.h"
 
 namespace fotomill {
 
@@ -76,15 +78,9 @@ void CopyRow(std::span<const uint8_t> line, const PcxHeader&, std::span<uint8_t>
 
 // One bit of each of 2 to 4 planes makes a 4-bit pixel, the first plane its lowest bit.
 void SpreadBitPlanes(std::span<const uint8_t> line, const PcxHeader& header, std::span<uint8_t> row) {
+  const size_t count = static_cast<size_t>(std::min(header.width, header.bytesPerLine * 8));
   std::memset(row.data(), 0, row.size());
-  const int32_t width = std::min(header.width, header.bytesPerLine * 8);
-  for (int32_t x = 0; x < width; ++x) {
-    int32_t index = 0;
-    for (int32_t p = 0; p < header.planes; ++p) {
-      index |= (line[static_cast<size_t>(p * header.bytesPerLine + x / 8)] >> (7 - x % 8) & 1) << p;
-    }
-    row[static_cast<size_t>(x / 2)] |= static_cast<uint8_t>(x % 2 == 0 ? index << 4 : index);
-  }
+  MergeBitPlanes(line.data(), count, header.planes, header.bytesPerLine, row.data());
 }
 
 // Four 2-bit pixels of a byte become four 4-bit ones.
@@ -103,11 +99,7 @@ void MergeColorPlanes(std::span<const uint8_t> line, const PcxHeader& header, st
   const uint8_t* red = line.data();
   const uint8_t* green = red + header.bytesPerLine;
   const uint8_t* blue = green + header.bytesPerLine;
-  for (size_t x = 0; x < count; ++x) {
-    row[3 * x] = blue[x];
-    row[3 * x + 1] = green[x];
-    row[3 * x + 2] = red[x];
-  }
+  MergeColors(blue, green, red, count, row.data());
   std::memset(row.data() + 3 * count, 0, row.size() - 3 * count);
 }
 
@@ -193,46 +185,6 @@ Status DescribePicture(const platform::FileView& file, PictureRecord& picture, P
   return ReadPalette(file, header, picture.bitsPerPixel, picture.palette);
 }
 
-// What a line left of its last run for the line after it.
-struct PendingRun {
-  size_t count = 0;
-  uint8_t value = 0;
-};
-
-// Decodes one line. A run that the line before left over is in `run`, which is empty before the first line. Ok, or
-// FileReadError when the data end inside the line.
-Status DecodeLine(ByteReader& bytes, PendingRun& run, std::span<uint8_t> line) {
-  size_t place = 0;
-  for (;;) {
-    const size_t repeated = std::min(run.count, line.size() - place);
-    std::memset(line.data() + place, run.value, repeated);
-    place += repeated;
-    run.count -= repeated;
-    if (place == line.size()) return Status::Ok;
-    const uint8_t byte = bytes.U8();
-    if (byte < kRunMark) {
-      run = {1, byte};
-    } else {
-      run = {static_cast<size_t>(byte & kLongestRun), bytes.U8()};
-    }
-    if (!bytes.Ok()) return Status::FileReadError;
-  }
-}
-
-// Codes one plane of a line; returns the number of bytes written, at most twice the plane's. Of a run of equal bytes
-// the last is left to the next token, so that m equal bytes cost a pair for m - 1 of them and one token more.
-size_t EncodePlane(std::span<const uint8_t> plane, uint8_t* out) {
-  const uint8_t* const begin = out;
-  for (size_t i = 0; i < plane.size();) {
-    size_t equal = 0;
-    while (equal < kLongestRun && i + equal + 1 < plane.size() && plane[i + equal] == plane[i + equal + 1]) ++equal;
-    if (equal > 0 || plane[i] >= kRunMark) *out++ = static_cast<uint8_t>(kRunMark + std::max<size_t>(equal, 1));
-    *out++ = plane[i];
-    i += std::max<size_t>(equal, 1);
-  }
-  return static_cast<size_t>(out - begin);
-}
-
 // What the writer stores for a picture.
 struct PcxLayout {
   int32_t depth = 0;  // 1, 2, 3, 4, 8 or 24
@@ -275,41 +227,32 @@ void WriteHeader(ByteWriter& out, const PcxLayout& layout, const PictureRecord& 
 }
 
 // Takes the planes of a row apart, `bytesPerLine` bytes each, one after the other.
-using SplitRow = void (*)(std::span<const uint8_t> row, int32_t width, const PcxLayout& layout,
-                          std::span<uint8_t> planes);
+using TakePlanes = void (*)(std::span<const uint8_t> row, int32_t width, const PcxLayout& layout,
+                            std::span<uint8_t> planes);
 
-void CopyPlane(std::span<const uint8_t> row, int32_t, const PcxLayout&, std::span<uint8_t> planes) {
+void TakePlane(std::span<const uint8_t> row, int32_t, const PcxLayout&, std::span<uint8_t> planes) {
   std::copy_n(row.begin(), planes.size(), planes.begin());
 }
 
-void SplitBitPlanes(std::span<const uint8_t> row, int32_t width, const PcxLayout& layout, std::span<uint8_t> planes) {
-  std::fill(planes.begin(), planes.end(), uint8_t{0});
-  for (int32_t x = 0; x < width; ++x) {
-    const int32_t index = row[static_cast<size_t>(x / 2)] >> (x % 2 == 0 ? 4 : 0) & 15;
-    for (int32_t p = 0; p < layout.planes; ++p) {
-      if ((index >> p & 1) != 0)
-        planes[static_cast<size_t>(p * layout.bytesPerLine + x / 8)] |= static_cast<uint8_t>(0x80 >> x % 8);
-    }
-  }
+void TakeBitPlanes(std::span<const uint8_t> row, int32_t width, const PcxLayout& layout, std::span<uint8_t> planes) {
+  SplitBitPlanes(row.data(), static_cast<size_t>(width), layout.planes, layout.bytesPerLine, planes.data());
 }
 
-void SplitColorPlanes(std::span<const uint8_t> row, int32_t width, const PcxLayout&, std::span<uint8_t> planes) {
+void TakeColorPlanes(std::span<const uint8_t> row, int32_t width, const PcxLayout&, std::span<uint8_t> planes) {
   const size_t count = static_cast<size_t>(width);
-  for (size_t x = 0; x < count; ++x) {
-    planes[x] = row[3 * x + 2];
-    planes[count + x] = row[3 * x + 1];
-    planes[2 * count + x] = row[3 * x];
-  }
+  uint8_t* red = planes.data();
+  SplitColors(row.data(), count, red + 2 * count, red + count, red);
 }
 
 void WriteLines(ByteWriter& out, const PcxLayout& layout, const PictureRecord& picture, std::span<uint8_t> planes) {
   const PackedImage& image = picture.image;
-  const SplitRow split = layout.depth == 24 ? SplitColorPlanes : layout.planes > 1 ? SplitBitPlanes : CopyPlane;
+  const TakePlanes take = layout.depth == 24 ? TakeColorPlanes : layout.planes > 1 ? TakeBitPlanes : TakePlane;
   for (int32_t y = 0; y < image.Height() && !out.Failed(); ++y) {
     picture.ReportRow(y);
-    split(image.Row(y), image.Width(), layout, planes);
+    take(image.Row(y), image.Width(), layout, planes);
     for (size_t begin = 0; begin < planes.size(); begin += layout.bytesPerLine) {
-      out.Used(EncodePlane(planes.subspan(begin, layout.bytesPerLine), out.Reserve(2 * size_t{layout.bytesPerLine})));
+      out.Used(
+          EncodePcxPlane(planes.subspan(begin, layout.bytesPerLine), out.Reserve(2 * size_t{layout.bytesPerLine})));
     }
   }
 }
@@ -336,15 +279,14 @@ Status PcxRead(PictureRecord& picture, const char* fileName) {
   platform::MemoryBlock line;
   RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette, picture.bitsPerPixel, image,
                                platform::Fill::Unset));
-  if (!line.Allocate(header.LineSize())) return Status::MemoryAllocationError;
+  if (!line.Allocate(header.LineSize() + PcxLineDecoder::kSlack)) return Status::MemoryAllocationError;
   const SpreadRow spread = FindArrangement(header)->spread;
-  ByteReader bytes(file.Bytes());
-  bytes.Seek(kHeaderSize);
-  PendingRun run;
+  const std::span<const uint8_t> decoded = line.Bytes().first(header.LineSize());
+  PcxLineDecoder decoder(file.Bytes().subspan(kHeaderSize));
   for (int32_t y = 0; y < header.height; ++y) {
-    RETURN_IF_BAD(DecodeLine(bytes, run, line.Bytes()));
-    spread(line.Bytes(), header, image.Row(y));
-    file.DropBefore(bytes.Position());
+    if (!decoder.Decode(line.Data(), header.LineSize())) return Status::FileReadError;
+    spread(decoded, header, image.Row(y));
+    file.DropBefore(static_cast<uint64_t>(decoder.Next() - file.Bytes().data()));
     picture.ReportRow(y);
   }
   if (!file.Intact()) return Status::FileReadError;
