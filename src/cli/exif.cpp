@@ -133,22 +133,24 @@ class ExifRun {
     return outcome;
   }
 
-  // The lines of one file in one piece; of several files, each under its name.
+  // The lines of one file in one piece, so that they cost one write; of several files, each under its name.
   Outcome ReportLines(const SelectedFile& file, bool named) {
     lines_.Clear();
     Outcome outcome = WalkFile(file, options_, lines_);
     if (outcome.status == Status::Ok && !lines_.Complete()) outcome.status = Status::MemoryAllocationError;
-    std::string_view text = lines_.Text();
-    if (text.empty()) return outcome;
-    if (named) output_.Line(output_.Shown(file.name));
-    text.remove_suffix(1);  // Line ends it
-    output_.Line(text);
+    if (lines_.Text().empty()) return outcome;
+    text_.clear();
+    if (named) text_.append(output_.Shown(file.name)).append("\n");
+    text_ += lines_.Text();
+    text_.pop_back();  // Line ends it
+    output_.Line(text_);
     return outcome;
   }
 
   const ExifOptions& options_;
   ResultOutput output_;
   ExifText lines_;
+  std::string text_;
 };
 
 bool ReadNumber(std::string_view text, double most, double& number) {

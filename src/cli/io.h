@@ -12,6 +12,7 @@ struct Io {
   bool inTerminal = false;
   bool outTerminal = false;
   bool errTerminal = false;
+  bool outStored = false;  // results go to a file: they may be kept for a moment and written together
 
   // Questions may be asked: someone sees them and can answer.
   bool Interactive() const { return inTerminal && errTerminal; }

@@ -1,3 +1,5 @@
+#include <cstdio>
+
 #include "cli/command.h"
 #include "platform/process.h"
 
@@ -7,6 +9,9 @@ int main(int count, char** arguments) {
   cli::Io io;
   io.inTerminal = platform::IsTerminal(0);
   io.outTerminal = platform::IsTerminal(1);
+  io.outStored = platform::IsStored(1);
+  static char buffer[64 * 1024];  // lives as long as the stream
+  if (io.outStored) std::setvbuf(io.out, buffer, _IOFBF, sizeof buffer);
   io.errTerminal = platform::IsTerminal(2);
   return cli::RunCommandLine(count, arguments, io);
 }

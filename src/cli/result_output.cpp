@@ -67,13 +67,13 @@ std::string ResultOutput::ShownMessage(std::string_view name) const {
 void ResultOutput::Line(std::string_view line) {
   Write(context_.io.out, line);
   Write(context_.io.out, "\n");
-  std::fflush(context_.io.out);
+  Deliver(false);
 }
 
 void ResultOutput::Element(const Json& element) {
   Write(context_.io.out, begun_ ? ",\n" : "\n");
   Write(context_.io.out, SafeJson(element));
-  std::fflush(context_.io.out);
+  Deliver(false);
   begun_ = true;
 }
 
@@ -112,17 +112,30 @@ int ResultOutput::Finish() {
 void ResultOutput::EndArray() {
   if (json_ && !ended_) {
     Write(context_.io.out, "\n]\n");
-    std::fflush(context_.io.out);
+    Deliver(true);
   }
   ended_ = true;
 }
 
 // Results that came before are on their way first, so that the two streams keep their order where they meet.
 void ResultOutput::PrintMessage(std::string_view text) {
+  Deliver(true);
   std::string line(text);
   line += "\n";
   Write(context_.io.err, line);
   std::fflush(context_.io.err);
+}
+
+// Sends results on their way. Those for a file may wait for others for a moment, as thousands of small writes cost more
+// than some commands.
+void ResultOutput::Deliver(bool now) {
+  constexpr std::chrono::milliseconds kLongestWait{100};
+  if (context_.io.outStored && !now) {
+    const auto time = std::chrono::steady_clock::now();
+    if (time - delivered_ < kLongestWait) return;
+    delivered_ = time;
+  }
+  std::fflush(context_.io.out);
 }
 
 }  // namespace fotomill::cli

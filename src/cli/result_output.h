@@ -1,5 +1,6 @@
 #pragma once
 
+#include <chrono>
 #include <cstdint>
 #include <nlohmann/json.hpp>
 #include <string>
@@ -19,7 +20,8 @@ void PutName(Json& object, const std::string& key, std::string_view name);
 void PutStatus(Json& object, Status status);
 
 // The output of one command over many things, in the order in which they happen: results on the standard output, as
-// lines or as one JSON array with an element a line, and messages on the standard error. Nothing is held back.
+// lines or as one JSON array with an element a line, and messages on the standard error. Nothing is held back,
+// except that results for a file are written a few times a second only.
 class ResultOutput {
  public:
   ResultOutput(const CommandContext& context, bool json);
@@ -55,12 +57,14 @@ class ResultOutput {
  private:
   void EndArray();
   void PrintMessage(std::string_view text);
+  void Deliver(bool now);
 
   const CommandContext& context_;
   const bool json_;
   bool colored_;
   bool begun_ = false;  // the array has an element
   bool ended_ = false;
+  std::chrono::steady_clock::time_point delivered_;
   uint64_t files_ = 0;
   uint64_t failures_ = 0;
 };

@@ -1,6 +1,8 @@
 #pragma once
 
+#include <bit>
 #include <cstdint>
+#include <cstring>
 #include <span>
 
 #include "metadata/exif_tags.h"
@@ -17,14 +19,8 @@ class ExifBytes {
   uint64_t Size() const { return bytes_.size(); }
   bool BigEndian() const { return bigEndian_; }
   uint8_t U8(uint64_t offset) const { return offset < bytes_.size() ? bytes_[offset] : uint8_t{0}; }
-  uint16_t U16(uint64_t offset) const {
-    const unsigned first = U8(offset), second = U8(offset + 1);
-    return static_cast<uint16_t>(bigEndian_ ? first << 8 | second : second << 8 | first);
-  }
-  uint32_t U32(uint64_t offset) const {
-    const uint32_t first = U16(offset), second = U16(offset + 2);
-    return bigEndian_ ? first << 16 | second : second << 16 | first;
-  }
+  uint16_t U16(uint64_t offset) const { return Number<uint16_t>(offset); }
+  uint32_t U32(uint64_t offset) const { return Number<uint32_t>(offset); }
   // As many of `count` bytes from `offset` on as there are.
   std::span<const uint8_t> Part(uint64_t offset, uint64_t count) const {
     if (offset >= bytes_.size()) return {};
@@ -33,6 +29,19 @@ class ExifBytes {
   }
 
  private:
+  template <typename T>
+  T Number(uint64_t offset) const {
+    T number = 0;
+    if (offset + sizeof number <= bytes_.size()) {
+      std::memcpy(&number, bytes_.data() + offset, sizeof number);
+    } else if (offset < bytes_.size()) {
+      std::memcpy(&number, bytes_.data() + offset, bytes_.size() - offset);
+    }
+    if (bigEndian_ == (std::endian::native == std::endian::big)) return number;
+    if constexpr (sizeof number == 2) return __builtin_bswap16(number);
+    return static_cast<T>(__builtin_bswap32(number));
+  }
+
   std::span<const uint8_t> bytes_;
   bool bigEndian_ = false;
 };

@@ -24,8 +24,8 @@ class ExifText : public ExifSink {
   void Clear();
 
  private:
-  void Add(std::string_view text);
-  void AddShown(std::string_view text);
+  // The place of the next `size` characters, all of which the caller writes; null without memory.
+  char* Room(uint64_t size);
 
   platform::MemoryBlock block_;
   uint64_t used_ = 0;

@@ -67,14 +67,27 @@ int64_t NumberAt(const ExifValue& value, uint64_t index) {
   }
 }
 
+// A rational with three decimals, just as "%.3f" shows the quotient of two doubles. In whole numbers, which is much the
+// quicker way: their exact quotient is too near to a rounding limit for a double only where it is right on it.
+void AddThousandths(std::string& buffer, const Rational& rational) {
+  const auto numerator = static_cast<uint64_t>(rational.numerator) * 1000;
+  const auto denominator = static_cast<uint64_t>(rational.denominator);
+  if (rational.numerator < 0 || rational.denominator <= 0 || numerator % denominator * 2 == denominator) {
+    return AddFixed(buffer, rational.Value(), 3);
+  }
+  const uint64_t thousandths = (numerator + denominator / 2) / denominator;
+  const uint64_t decimals = thousandths % 1000;
+  AddNumber(buffer, static_cast<int64_t>(thousandths / 1000));
+  const char digits[] = {'.', static_cast<char>('0' + decimals / 100), static_cast<char>('0' + decimals / 10 % 10),
+                         static_cast<char>('0' + decimals % 10)};
+  buffer.append(digits, sizeof digits);
+}
+
 void AddValue(std::string& buffer, const ExifValue& value, uint64_t index) {
-  if (value.type != kExifRational && value.type != kExifSRational) return AddNumber(buffer, NumberAt(value, index));
-  const Rational rational = RationalAt(value, index);
-  if (rational.denominator == 1) {  // most whole numbers, and much the cheaper way
-    AddNumber(buffer, rational.numerator);
-    buffer += ".000";
+  if (value.type == kExifRational || value.type == kExifSRational) {
+    AddThousandths(buffer, RationalAt(value, index));
   } else {
-    AddFixed(buffer, rational.Value(), 3);
+    AddNumber(buffer, NumberAt(value, index));
   }
 }
 

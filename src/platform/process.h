@@ -13,6 +13,7 @@ std::vector<std::string> ProgramFor(const std::string& file);
 [[nodiscard]] bool RunProgram(const std::vector<std::string>& arguments, bool wait);
 
 bool IsTerminal(int stream);  // 0 standard input, 1 output, 2 error
+bool IsStored(int stream);    // goes to a regular file: nobody waits for what is written
 int TerminalWidth();          // columns, 80 when unknown
 unsigned CoreCount();         // cores this process may use, at least 1
 

@@ -3,6 +3,9 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <bit>
+#include <cstring>
+#include <random>
 
 #include "core/limits.h"
 #include "metadata/exif_tags.h"
@@ -170,6 +173,34 @@ TEST(ExifValue, TurnsValuesIntoText) {
       const ExifValue value{row.tag, row.type, row.count, ExifBytes(bytes, bigEndian)};
       const auto text = ExifValueText(value, FindExifTag(row.tag), buffer);
       EXPECT_EQ(text.value_or("no line"), row.text == kNoLine ? "no line" : row.text);
+    }
+  }
+}
+
+// Every way of rounding, beside what the C library makes of the quotient.
+TEST(ExifValue, RoundsRationalsAsPrintfDoes) {
+  std::mt19937 random(1);
+  std::string buffer;
+  std::vector<std::pair<uint32_t, uint32_t>> rationals = {
+      {1, 16}, {3, 16}, {5, 10000}, {15, 10000}, {1, 2000}, {3, 2000}, {4294967295, 2000}, {4294967295, 4294967295},
+      {4294967295, 4294967294}, {1, 4294967295}, {999, 1000}, {9995, 10000}, {99995, 100000}, {0, 7}};
+  for (int i = 0; i < 20000; ++i) rationals.emplace_back(random() >> random() % 32, random() >> random() % 32 | 1);
+  for (const uint32_t odd : {1u, 3u, 5u, 77777u}) {
+    for (uint32_t half = 16; half <= 2000000; half *= 5) rationals.emplace_back(odd, half);
+  }
+  for (const auto& [numerator, denominator] : rationals) {
+    for (const uint16_t type : {R, Q}) {
+      uint8_t bytes[8];
+      std::memcpy(bytes, &numerator, 4);
+      std::memcpy(bytes + 4, &denominator, 4);
+      const auto text = ExifValueText({0x829d, type, 1, ExifBytes(bytes, std::endian::native == std::endian::big)},
+                                      FindExifTag(0x829d), buffer);
+      const double quotient = type == R ? static_cast<double>(numerator) / denominator
+                                        : static_cast<double>(static_cast<int32_t>(numerator)) /
+                                              static_cast<int32_t>(denominator);
+      char expected[64];
+      std::snprintf(expected, sizeof expected, "%.3f", quotient);
+      ASSERT_EQ(text, expected) << numerator << '/' << denominator;
     }
   }
 }

@@ -71,16 +71,16 @@ ReadResult ReadToEnd(int handle, uint64_t size, uint64_t most, std::string& cont
 }  // namespace
 
 FileFacts FactsOf(const std::string& path) {
+  constexpr unsigned kWanted = STATX_BASIC_STATS | STATX_BTIME;
   FileFacts facts;
-  struct stat own;
-  if (lstat(path.c_str(), &own) != 0) {
+  struct statx found;
+  if (statx(AT_FDCWD, path.c_str(), AT_STATX_SYNC_AS_STAT | AT_SYMLINK_NOFOLLOW, kWanted, &found) != 0) {
     facts.kind = NothingThere() ? FileKind::Missing : FileKind::Other;
     return facts;
   }
-  facts.link = S_ISLNK(own.st_mode);
+  facts.link = S_ISLNK(found.stx_mode);
   facts.kind = FileKind::Other;
-  struct statx found;
-  if (statx(AT_FDCWD, path.c_str(), AT_STATX_SYNC_AS_STAT, STATX_BASIC_STATS | STATX_BTIME, &found) != 0) return facts;
+  if (facts.link && statx(AT_FDCWD, path.c_str(), AT_STATX_SYNC_AS_STAT, kWanted, &found) != 0) return facts;
   facts.kind = KindOf(found.stx_mode);
   facts.size = found.stx_size;
   facts.modified = found.stx_mtime.tv_sec;

@@ -116,6 +116,11 @@ bool RunProgram(const std::vector<std::string>& arguments, bool wait) {
 
 bool IsTerminal(int stream) { return isatty(stream) == 1; }
 
+bool IsStored(int stream) {
+  struct stat facts;
+  return fstat(stream, &facts) == 0 && S_ISREG(facts.st_mode);
+}
+
 int TerminalWidth() {
   for (const int stream : {STDERR_FILENO, STDOUT_FILENO}) {
     winsize size = {};
