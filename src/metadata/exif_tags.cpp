@@ -25,7 +25,8 @@ constexpr uint16_t kLightSources[] = {0,  1,  2,  3,  4,  9,  10, 11, 12, 13, 14
                                       15, 17, 18, 19, 20, 21, 22, 23, 24, 255};
 constexpr uint16_t kColorSpaces[] = {0, 1};
 
-// The orientations 3 and 4 carry each other's words, and a white balance of 0 reads "None": users know the lists so.
+// Users know the lists as they stand, though some are not those of the standard: the orientations 3 and 4 carry each
+// other's words, a white balance of 0 reads "None", and a sensing method has the words of the next one.
 // clang-format off
 constexpr ExifWordList kAltitudeWords{"Sea level;Sea level reference"};
 constexpr ExifWordList kLatitudeWords{"North;South", Letter, kNorth, 1};

@@ -2,7 +2,7 @@
 
 #include <nlohmann/json.hpp>
 
-#include "cli/command.h"
+#include "support/command_line.h"
 #include "support/exif_blocks.h"
 #include "support/files.h"
 #include "support/hex.h"
@@ -13,29 +13,10 @@ namespace fotomill::test {
 namespace {
 
 using testing::HasSubstr;
-using testing::StartsWith;
 
-struct Result {
-  int status;
-  std::string out, err;
-};
-
-std::string Contents(std::FILE* file) {
-  std::string text(static_cast<size_t>(std::ftell(file)), '\0');
-  std::rewind(file);
-  text.resize(std::fread(text.data(), 1, text.size(), file));
-  std::fclose(file);
-  return text;
-}
-
-Result Exif(std::vector<std::string> words) {
-  std::vector<const char*> arguments = {"fotomill", "exif"};
-  for (const std::string& word : words) arguments.push_back(word.c_str());
-  cli::Io io;
-  io.out = std::tmpfile();
-  io.err = std::tmpfile();
-  const int status = cli::RunCommandLine(static_cast<int>(arguments.size()), arguments.data(), io);
-  return {status, Contents(io.out), Contents(io.err)};
+CommandResult Exif(std::vector<std::string> arguments) {
+  arguments.insert(arguments.begin(), "exif");
+  return RunCommand(arguments);
 }
 
 constexpr char kBlockText[] =
@@ -67,7 +48,7 @@ class ExifCommand : public testing::Test {
 };
 
 TEST_F(ExifCommand, PrintsTheLinesOfTheViewer) {
-  const Result result = Exif({picture});
+  const CommandResult result = Exif({picture});
   EXPECT_EQ(result.status, 0);
   EXPECT_EQ(result.out, kBlockText);
   EXPECT_EQ(Exif({picture, picture}).out, picture + "\n" + kBlockText + picture + "\n" + kBlockText);
@@ -92,7 +73,7 @@ TEST_F(ExifCommand, EscapesWhatValuesMayHold) {
 TEST_F(ExifCommand, PrintsJson) {
   WriteText(folder.Path("without.bmp"), "BM");
   WriteBytes(folder.Path("refused.tif"), Hex("4949 2B00 08000000"));
-  const Result result =
+  const CommandResult result =
       Exif({"--json", picture, folder.Path("without.bmp"), folder.Path("refused.tif"), folder.Path("missing.jpg")});
   EXPECT_EQ(result.status, 1);
   const auto json = nlohmann::json::parse(result.out);
@@ -118,7 +99,7 @@ TEST_F(ExifCommand, ExtractsTheThumbnailWithoutReplacingAnything) {
   EXPECT_EQ(Exif({picture, "--thumbnail", out}).status, 0);
   EXPECT_EQ(ReadBytes(out), Hex("FFD8 FFD9"));
   WriteText(out, "mine");
-  const Result refused = Exif({picture, "--thumbnail", out});
+  const CommandResult refused = Exif({picture, "--thumbnail", out});
   EXPECT_EQ(refused.status, 1);
   EXPECT_THAT(refused.err, HasSubstr("small.jpg: Error creating file."));
   EXPECT_EQ(ReadText(out), "mine");
@@ -131,7 +112,7 @@ TEST_F(ExifCommand, ExtractsTheThumbnailWithoutReplacingAnything) {
   BlockBuilder plain;
   plain.Directory({{0x0100, 3, 1, 1}});
   WriteBytes(picture, plain.block);
-  const Result none = Exif({picture, "--thumbnail", folder.Path("other.jpg")});
+  const CommandResult none = Exif({picture, "--thumbnail", folder.Path("other.jpg")});
   EXPECT_EQ(none.status, 1);
   EXPECT_THAT(none.err, HasSubstr("picture.tif: No images in this document."));
   EXPECT_EQ(folder.Names(), (std::vector<std::string>{"picture.tif", "small.jpg"}));
@@ -149,7 +130,7 @@ TEST_F(ExifCommand, MeasuresDistances) {
   EXPECT_EQ(json[0]["unit"], "kilometers");
   for (const char* bad : {"", "45", "45,", ",9", "45,9,1", "45 9", "91,0", "nan,0", "1e400,0", "0,361", "45,9x"}) {
     SCOPED_TRACE(bad);
-    const Result result = Exif({"--distance", bad, "46,9"});
+    const CommandResult result = Exif({"--distance", bad, "46,9"});
     EXPECT_EQ(result.status, 2);
     EXPECT_EQ(result.out, "");
   }
