@@ -1,7 +1,9 @@
 #include "cli/commands.h"
 
+#include "cli/completion.h"
 #include "cli/config.h"
 #include "cli/convert.h"
+#include "cli/doctor.h"
 #include "cli/exif.h"
 #include "cli/formats.h"
 #include "cli/info.h"
@@ -27,6 +29,8 @@ constexpr Command kCommands[] = {
     {"config set",   "give a key a value",                                     Needs::Settings, SetUpConfigSet},
     {"config unset", "give a key its default again",                           Needs::Settings, SetUpConfigUnset},
     {"config path",  "print where the configuration file is",                  Needs::Settings, SetUpConfigPath},
+    {"doctor",  "tell where things are, what is missing and why",               Needs::Formats,  SetUpDoctor},
+    {"completion", "print a script that completes command lines in a shell",   Needs::Nothing,  SetUpCompletion},
 };
 // clang-format on
 

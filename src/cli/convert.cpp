@@ -73,16 +73,22 @@ std::string UnknownFormat(const std::string& extension) {
   return "There is no format \"" + extension + "\"." + NearestNameHint(extension, names);
 }
 
+// What a run converts to.
+struct Target {
+  int32_t row = kNoFormat;
+  std::string extension;  // a plug-in format's has to be kept, as its row may serve another one meanwhile
+};
+
 // One run of the command over its selection.
 class Conversion {
  public:
-  Conversion(const ConvertOptions& options, const CommandContext& context, int32_t row,
+  Conversion(const ConvertOptions& options, const CommandContext& context, const Target& target,
              const std::vector<SelectedFile>& files)
       : options_(options),
         context_(context),
-        rowIndex_(row),
-        row_(FormatRow(row)),
-        extension_(row_.extension),
+        rowIndex_(target.row),
+        row_(FormatRow(target.row)),
+        extension_(target.extension),
         files_(files),
         names_(files),
         output_(context, options.json) {
@@ -265,14 +271,15 @@ class Conversion {
   Overwrite policy_;
 };
 
-// What is wrong with the options, as a sentence; empty when nothing is. Sets `row`.
-std::string CheckOptions(const ConvertOptions& options, const CommandContext& context, int32_t& row) {
+// What is wrong with the options, as a sentence; empty when nothing is. Fills `target`.
+std::string CheckOptions(const ConvertOptions& options, const CommandContext& context, Target& target) {
   if (options.to.empty() && options.out.empty()) return "Say with --to which format to convert to.";
-  row = RowOfExtension(options.to.empty() ? platform::ExtensionOf(options.out) : options.to);
+  const int32_t row = RowOfExtension(options.to.empty() ? platform::ExtensionOf(options.out) : options.to);
   if (row == kNoFormat) {
     return options.to.empty() ? "\"" + options.out + "\" selects no format; name one with --to."
                               : UnknownFormat(options.to);
   }
+  target = {row, std::string(FormatRow(row).extension)};
   if (!CanWrite(FormatRow(row))) {
     return std::string(FormatRow(row).extension) + " cannot be written. " + std::string(WhyNot(FormatRow(row)));
   }
@@ -289,13 +296,14 @@ std::string CheckOptions(const ConvertOptions& options, const CommandContext& co
 }
 
 int RunConvert(const ConvertOptions& options, const CommandContext& context) {
-  int32_t row = kNoFormat;
-  if (const std::string wrong = CheckOptions(options, context, row); !wrong.empty()) return UsageError(context, wrong);
+  Target target;
+  if (const std::string wrong = CheckOptions(options, context, target); !wrong.empty())
+    return UsageError(context, wrong);
   const auto files = SelectFiles(options.selection, context);
   if (!files) return kExitUsage;
   if (!options.out.empty() && files->size() != 1) return UsageError(context, "--out takes exactly one picture.");
   if (options.quality > 0) settings.JpegCompression = settings.WebPQualityFactor = options.quality;
-  return Conversion(options, context, row, *files).Run();
+  return Conversion(options, context, target, *files).Run();
 }
 
 }  // namespace

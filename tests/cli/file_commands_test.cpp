@@ -244,5 +244,17 @@ TEST(FormatsCommand, ListsTheRegistry) {
   EXPECT_THAT(RunCommand({"formats", "--filter"}).out, HasSubstr("\n(BMP) Windows bitmap\t*.BMP\n"));
 }
 
+TEST(DoctorCommand, TellsWhatIsWrongWithTheConfiguration) {
+  const TemporaryFolder folder;
+  WriteText(folder.Path("Fotomill Professional 11.ini"), "[Fotomill]\nJpegCompression=high\nPngCompression=6\n");
+  const CommandResult result = RunCommand({"--data", folder.Path(), "doctor"});
+  EXPECT_EQ(result.status, 0);
+  EXPECT_THAT(result.out, HasSubstr("Data folder     " + folder.Path() + "\n"));
+  EXPECT_THAT(result.out, HasSubstr("  line 2        JpegCompression=high: JpegCompression takes"));
+  EXPECT_THAT(result.out, testing::Not(HasSubstr("PngCompression")));
+  EXPECT_THAT(result.out, HasSubstr("\n  Switched off: EXE EPS JFI JPE\n"));
+  EXPECT_THAT(RunCommand({"--data", folder.Path("none"), "--no-plugins", "doctor"}).out, HasSubstr("not there yet"));
+}
+
 }  // namespace
 }  // namespace fotomill::test

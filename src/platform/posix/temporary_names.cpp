@@ -15,9 +15,9 @@ constexpr size_t kLongestName = 4096;
 struct Slot {
   enum State { Free, Writing, Listed };
   std::atomic<int> state{Free};
-  char name[kLongestName];
+  char name[kLongestName] = {};
 };
-Slot slots[64];
+constinit Slot slots[64];  // no pages are touched before a name is entered
 static_assert(std::atomic<int>::is_always_lock_free, "the handler may only touch lock-free objects");
 
 }  // namespace
