@@ -21,6 +21,7 @@ namespace fotomill::platform {
 
 namespace {
 
+constexpr int kMostAppearances = 3;
 constexpr uint64_t kFirstRead = 64 * 1024;  // for files that do not tell their size
 
 FileKind KindOf(mode_t mode) {
@@ -173,8 +174,14 @@ bool CopyTimes(const std::string& from, const std::string& to) {
 ReadResult ReadWholeFile(const std::string& path, uint64_t most, std::string& contents) {
   contents.clear();
   struct stat facts;
-  const Handle handle = FaultDue() ? Handle() : OpenRegular(path.c_str(), O_RDONLY, facts);
-  if (!handle.IsOpen()) return FileExists(path) ? ReadResult::Failed : ReadResult::Missing;
+  if (FaultDue()) return FileExists(path) ? ReadResult::Failed : ReadResult::Missing;
+  Handle handle = OpenRegular(path.c_str(), O_RDONLY, facts);
+  for (int attempt = 0; !handle.IsOpen(); ++attempt) {
+    const bool missing = errno == ENOENT;
+    if (!FileExists(path)) return ReadResult::Missing;
+    if (!missing || attempt == kMostAppearances) return ReadResult::Failed;
+    handle = OpenRegular(path.c_str(), O_RDONLY, facts);  // someone has just made it, unless it is a link to nothing
+  }
   const uint64_t size = static_cast<uint64_t>(facts.st_size);
   if (size > most) return ReadResult::TooLarge;
   ReadResult result = ReadResult::Failed;
