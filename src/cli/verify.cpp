@@ -19,7 +19,7 @@ struct VerifyOptions {
 };
 
 // Decodes every page of a file.
-Status VerifyFile(const std::string& name) {
+Status VerifyFile(const std::string& name, std::string& hint) {
   int32_t pages = 1;
   for (int32_t page = 0; page < pages; ++page) {
     PicturePointer picture;
@@ -27,6 +27,10 @@ Status VerifyFile(const std::string& name) {
     picture->page = page;
     pages = picture->pageCount;
     RETURN_IF_BAD(ReadPicture(*picture));
+    if (!picture->warning.empty()) {  // it can be shown, but it is not what was saved
+      hint = picture->warning.view();
+      return Status::DamagedFile;
+    }
   }
   return Status::Ok;
 }
@@ -37,7 +41,8 @@ int RunVerify(const VerifyOptions& options, const CommandContext& context) {
   ResultOutput output(context, options.json);
   for (const SelectedFile& file : *files) {
     if (!output.GoesOn()) break;
-    const Status status = file.status == Status::Ok ? VerifyFile(file.name) : file.status;
+    std::string hint = file.hint;
+    const Status status = file.status == Status::Ok ? VerifyFile(file.name, hint) : file.status;
     if (output.IsJson()) {
       Json element;
       PutName(element, "file", file.name);
@@ -45,7 +50,7 @@ int RunVerify(const VerifyOptions& options, const CommandContext& context) {
       output.Element(element);
     }
     if (status != Status::Ok) {
-      output.Failure(file.name, status, file.hint.empty() ? OpenHint(file.name, status) : file.hint);
+      output.Failure(file.name, status, hint.empty() ? OpenHint(file.name, status) : hint);
       continue;
     }
     output.CountFile();

@@ -27,6 +27,7 @@
 
 #include <algorithm>
 #include <cstring>
+#include <functional>
 #include <vector>
 
 #include "core/byte_reader.h"
@@ -140,10 +141,10 @@ uint64_t Rank(const IcoEntry& entry) {
   return static_cast<uint64_t>(bitmap.width) * static_cast<uint64_t>(bitmap.height) * 64 + bitmap.bits;
 }
 
-// The entry that `picture.page` asks for; null beyond the last one.
-const IcoEntry* ChooseEntry(const IcoFile& icons, int32_t page) {
-  if (page > 0) return static_cast<size_t>(page) <= icons.entries.size() ? &icons.entries[static_cast<size_t>(page) - 1] : nullptr;
-  return &*std::ranges::max_element(icons.entries, {}, Rank);
+// Entry number `page` from the best one down; null beyond the last.
+const IcoEntry* ChooseEntry(IcoFile& icons, int32_t page) {
+  std::ranges::stable_sort(icons.entries, std::greater(), Rank);
+  return static_cast<size_t>(page) < icons.entries.size() ? &icons.entries[static_cast<size_t>(page)] : nullptr;
 }
 
 bool AnyMasked(const IcoBitmap& bitmap) {
@@ -240,7 +241,7 @@ Status LoadPngEntry(std::span<const uint8_t> entry, PictureRecord& picture, Pack
 }
 
 // Facts, and with `image` the pixels, of the entry that the picture's page selects.
-Status LoadEntry(const IcoFile& icons, PictureRecord& picture, PackedImage* image, PackedImage* alpha) {
+Status LoadEntry(IcoFile& icons, PictureRecord& picture, PackedImage* image, PackedImage* alpha) {
   const IcoEntry* entry = ChooseEntry(icons, picture.page);
   if (entry == nullptr) return Status::NoImages;
   picture.typeName.AssignCut(icons.cursors ? "Windows cursor" : "Windows icon");

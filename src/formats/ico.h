@@ -5,8 +5,7 @@
 
 namespace fotomill {
 
-// Windows icons and cursors. `picture.page` above 0 selects an entry in the order of the file, counted from 1; 0 takes the
-// best one. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when an entry is cut short,
+// Windows icons and cursors. `picture.page` counts the entries from the best one, 0, down. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when an entry is cut short,
 // MemoryAllocationError (6), UnsupportedFormat (8) for a compressed bitmap, NoImages (20) for an empty file.
 Status IcoInfo(PictureRecord& picture, const char* fileName, uint32_t flags);
 Status IcoRead(PictureRecord& picture, const char* fileName);

@@ -9,6 +9,7 @@
 #include "formats/fits.h"
 #include "formats/gif.h"
 #include "formats/ico.h"
+#include "formats/jpeg.h"
 #include "formats/mac.h"
 #include "formats/pcx.h"
 #include "formats/png.h"
@@ -86,7 +87,7 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"IMG", "(IMG) GEM/Ventura", 1, 24, FMT_BITMAP,
      nullptr, NoInfo, NoRead, NoWrite},
     {"JPG", "(JPG) Jpeg", 1, 24, FMT_BITMAP,
-     NoDetails, NoInfo, NoRead, NoWrite},
+     JpegDetails, JpegInfo, JpegRead, JpegWrite},
     {"LBM", "(LBM) Amiga", 1, 8, FMT_BITMAP,
      NoDetails, NoInfo, NoRead, NoWrite},
     {"MAC", "(MAC) MacPaint", 1, 1, FMT_BITMAP,
@@ -164,13 +165,13 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"HAM", "(HAM) Amiga", 1, 24, FMT_BITMAP | FMT_SECONDARY,
      NoDetails, NoInfo, NoRead, NoWrite},
     {"JFI", "(JFI) Jpeg", 0, 24, FMT_BITMAP | FMT_SECONDARY,
-     nullptr, NoInfo, NoRead, NoWrite},
+     nullptr, JpegInfo, JpegRead, JpegWrite},
     {"JFIF", "(JFIF) Jpeg", 1, 24, FMT_BITMAP | FMT_SECONDARY,
-     nullptr, NoInfo, NoRead, NoWrite},
+     nullptr, JpegInfo, JpegRead, JpegWrite},
     {"JPE", "(JPE) Jpeg", 0, 24, FMT_BITMAP | FMT_SECONDARY,
-     nullptr, NoInfo, NoRead, NoWrite},
+     nullptr, JpegInfo, JpegRead, JpegWrite},
     {"JPEG", "(JPEG) Jpeg", 1, 24, FMT_BITMAP | FMT_SECONDARY,
-     nullptr, NoInfo, NoRead, NoWrite},
+     nullptr, JpegInfo, JpegRead, JpegWrite},
     {"KDC", "(KDC) Kodak Digital Camera", 1, 24, FMT_BITMAP | FMT_SECONDARY,
      nullptr, NoInfo, NoRead, NeverWritten},
     {"PCT", "(PCT) Macintosh PICT", 1, 24, FMT_BITMAP | FMT_SECONDARY,

@@ -61,14 +61,14 @@ TEST(IcoRead, TheLargestThenDeepestEntryWinsAndPagesSelect) {
   WriteBytes(folder.Path("a.cur"), Hex("0000 0200 0300  01 01 00 00 0000 0000 30000000 36000000 "
                                        "02 01 00 00 0000 0000 38000000 66000000  02 01 00 00 0300 0400 34000000 9E000000 " +
                                        small + shallow + deep));
-  const char* const pixels[] = {"030201 060504", "0C0B0A", "0 1", "030201 060504"};
-  for (int32_t page = 0; page < 4; ++page) {
+  const char* const pixels[] = {"030201 060504", "0 1", "0C0B0A"};
+  for (int32_t page = 0; page < 3; ++page) {
     const PicturePointer picture = NewPictureRecord();
     picture->page = page;
     ASSERT_EQ(IcoRead(*picture, folder.Path("a.cur").c_str()), Status::Ok);
     EXPECT_EQ(PixelText(picture->image), pixels[page]) << page;
     EXPECT_EQ(picture->pageCount, 3);
-    EXPECT_EQ(picture->hotSpotY, page == 0 || page == 3 ? 4 : 0);
+    EXPECT_EQ(picture->hotSpotY, page == 0 ? 4 : 0);
   }
 }
 
