@@ -11,20 +11,18 @@ namespace fotomill::bench {
 
 namespace {
 
-constexpr int32_t kWidth = 2000, kHeight = 1500;
-
 enum class Content { Photo, Flat };
 
 // Bytes of a row: a gradient with a little noise, or areas of 200 equal bytes.
-PicturePointer MakePicture(Content content, int32_t depth) {
+PicturePointer MakePicture(Content content, int32_t depth, Size size) {
   PicturePointer picture = NewPictureRecord();
-  picture->width = kWidth;
-  picture->height = kHeight;
+  picture->width = size.width;
+  picture->height = size.height;
   picture->bitsPerPixel = depth;
   MakeDefaultPalette(&picture->palette, nullptr, depth == 1 ? kBlackAndWhitePalette : kDisplayPalette);
-  if (NewPackedImage(kWidth, kHeight, &picture->palette, depth, picture->image) != Status::Ok) return nullptr;
+  if (NewPackedImage(size.width, size.height, &picture->palette, depth, picture->image) != Status::Ok) return nullptr;
   uint32_t state = 1;
-  for (int32_t y = 0; y < kHeight; ++y) {
+  for (int32_t y = 0; y < size.height; ++y) {
     const auto row = picture->image.Row(y);
     for (size_t i = 0; i < row.size(); ++i) {
       state = state * 1664525 + 1013904223;
@@ -44,8 +42,8 @@ void SetBytes(benchmark::State& state, const PackedImage& image) {
   state.SetBytesProcessed(static_cast<int64_t>(state.iterations()) * static_cast<int64_t>(image.Rows().size()));
 }
 
-void Encode(benchmark::State& state, const char* extension, Content content, int32_t depth) {
-  const PicturePointer picture = MakePicture(content, depth);
+void Encode(benchmark::State& state, const char* extension, Content content, int32_t depth, Size size) {
+  const PicturePointer picture = MakePicture(content, depth, size);
   const std::string name = FileName(extension);
   const FormatEntry& row = FormatRow(FindFormatByName(name));
   picture->fileName.AssignCut(name);
@@ -58,8 +56,8 @@ void Encode(benchmark::State& state, const char* extension, Content content, int
   SetBytes(state, picture->image);
 }
 
-void Decode(benchmark::State& state, const char* extension, Content content, int32_t depth) {
-  const PicturePointer source = MakePicture(content, depth);
+void Decode(benchmark::State& state, const char* extension, Content content, int32_t depth, Size size) {
+  const PicturePointer source = MakePicture(content, depth, size);
   const std::string name = FileName(extension);
   const FormatEntry& row = FormatRow(FindFormatByName(name));
   source->fileName.AssignCut(name);
@@ -69,11 +67,11 @@ void Decode(benchmark::State& state, const char* extension, Content content, int
     if (row.read(*picture, name.c_str()) != Status::Ok) state.SkipWithError("cannot read");
   }
   std::filesystem::remove(name);
-  SetBytes(state, source->image);
+  SetBytes(state, picture->image);
 }
 
 void Copy(benchmark::State& state, int32_t depth) {
-  const PicturePointer picture = MakePicture(Content::Photo, depth);
+  const PicturePointer picture = MakePicture(Content::Photo, depth, Size());
   const auto rows = picture->image.Rows();
   std::vector<uint8_t> copy(rows.size());
   for (auto _ : state) {
@@ -93,7 +91,7 @@ const bool copiesAreRegistered = [] {
 
 }  // namespace
 
-void RegisterCodec(const char* extension, std::initializer_list<int32_t> depths) {
+void RegisterCodec(const char* extension, std::initializer_list<int32_t> depths, Size size) {
   constexpr struct {
     const char* name;
     Content content;
@@ -101,8 +99,10 @@ void RegisterCodec(const char* extension, std::initializer_list<int32_t> depths)
   for (const int32_t depth : depths) {
     for (const auto& kind : kContents) {
       const std::string tail = std::string("/") + kind.name + "/" + std::to_string(depth);
-      benchmark::RegisterBenchmark((extension + ("/decode" + tail)).c_str(), Decode, extension, kind.content, depth);
-      benchmark::RegisterBenchmark((extension + ("/encode" + tail)).c_str(), Encode, extension, kind.content, depth);
+      benchmark::RegisterBenchmark((extension + ("/decode" + tail)).c_str(), Decode, extension, kind.content, depth,
+                                   size);
+      benchmark::RegisterBenchmark((extension + ("/encode" + tail)).c_str(), Encode, extension, kind.content, depth,
+                                   size);
     }
   }
 }

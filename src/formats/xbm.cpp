@@ -46,6 +46,15 @@ struct XbmSize {
   int64_t height = 0;
 };
 
+// The value of a hexadecimal digit, 0 for any other character.
+constexpr std::array<uint8_t, 256> MakeDigitValues() {
+  std::array<uint8_t, 256> values{};
+  for (uint8_t i = 0; i < 10; ++i) values['0' + i] = i;
+  for (uint8_t i = 0; i < 6; ++i) values['a' + i] = values['A' + i] = static_cast<uint8_t>(10 + i);
+  return values;
+}
+constexpr std::array<uint8_t, 256> kDigitValues = MakeDigitValues();
+
 // Reads a text front to back. A scan for something that is not there ends at the limit for texts.
 class XbmText {
  public:
@@ -69,7 +78,8 @@ class XbmText {
     const char* const scanEnd = next_ + std::min(static_cast<uint64_t>(end_ - next_), limits.textScanBytes);
     while (next_ != scanEnd && *next_ != 'x') ++next_;
     if (end_ - next_ < 3 || next_ == scanEnd) return false;
-    value = static_cast<uint8_t>(DigitValue(next_[1]) << 4 | DigitValue(next_[2]));
+    value = static_cast<uint8_t>(kDigitValues[static_cast<uint8_t>(next_[1])] << 4 |
+                                 kDigitValues[static_cast<uint8_t>(next_[2])]);
     next_ += 3;
     return true;
   }
@@ -78,12 +88,6 @@ class XbmText {
   uint64_t Left() const { return static_cast<uint64_t>(end_ - next_); }
 
  private:
-  static constexpr int DigitValue(char c) {
-    if (c >= '0' && c <= '9') return c - '0';
-    if (c >= 'a' && c <= 'f') return c - 'a' + 10;
-    return c >= 'A' && c <= 'F' ? c - 'A' + 10 : 0;
-  }
-
   const char* next_;
   const char* end_;
   const char* start_;
@@ -184,18 +188,33 @@ class XbmValueWriter {
   XbmValueWriter(ByteWriter& out, uint64_t total) : out_(out), left_(total) {}
 
   void Write(std::span<const uint8_t> values) {
+    while (!values.empty()) {
+      const size_t count = std::min(values.size(), kValuesPerLine - inLine_);
+      WriteInLine(values.first(count));
+      values = values.subspan(count);
+    }
+  }
+
+ private:
+  static constexpr size_t kTextBytes = 6;  // "0x1f, "
+
+  void WriteInLine(std::span<const uint8_t> values) {
     constexpr char kDigits[] = "0123456789abcdef";
+    uint8_t* place = out_.Reserve(values.size() * kTextBytes);
     for (const uint8_t value : values) {
-      const char text[] = {'0', 'x', kDigits[value >> 4], kDigits[value & 15], ',', ' '};
-      --left_;
-      out_.Text({text, left_ == 0 ? size_t{4} : size_t{6}});
-      if (++inLine_ < kValuesPerLine) continue;
+      const char text[kTextBytes] = {'0', 'x', kDigits[value >> 4], kDigits[value & 15], ',', ' '};
+      std::memcpy(place, text, kTextBytes);
+      place += kTextBytes;
+    }
+    left_ -= values.size();
+    out_.Used(values.size() * kTextBytes - (left_ == 0 ? 2 : 0));
+    inLine_ += values.size();
+    if (inLine_ == kValuesPerLine) {
       out_.Text(platform::kLineEnd);
       inLine_ = 0;
     }
   }
 
- private:
   ByteWriter& out_;
   uint64_t left_;
   size_t inLine_ = 0;

@@ -1,0 +1,3 @@
+#include "codec_bench.h"
+
+static const bool registered = (fotomill::bench::RegisterCodec("mac", {1}, {576, 720}), true);
