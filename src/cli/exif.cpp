@@ -104,7 +104,9 @@ class ExifRun {
         continue;
       }
       output_.CountFile();
-      if (!outcome.hasExif && !options_.json) output_.Note(file.name + ": There is no EXIF in this file.");
+      if (!outcome.hasExif && !options_.json) {
+        output_.Note(output_.ShownMessage(file.name) + ": There is no EXIF in this file.");
+      }
     }
   }
 

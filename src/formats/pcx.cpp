@@ -46,9 +46,6 @@ constexpr size_t kHeaderPaletteSize = 48;
 constexpr uint8_t kTrailerMark = 12;
 constexpr uint64_t kTrailerSize = 1 + 768;
 
-constexpr uint8_t kRunMark = 0xC0;  // both top bits: a count byte
-constexpr size_t kLongestRun = 63;
-
 // The palette of version 3 files, which hold none.
 constexpr std::array<uint8_t, kHeaderPaletteSize> kFixedColors = {
     0x00, 0x00, 0x00, 0x00, 0x00, 0xAA, 0x00, 0xAA, 0x00, 0x00, 0xAA, 0xAA, 0xAA, 0x00, 0x00, 0xAA,
