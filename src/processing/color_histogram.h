@@ -14,8 +14,8 @@ struct ColorBin {
   float weight;      // pixels
 };
 
-// Gathers the colours of a picture into 32 x 32 x 32 cells.
-class ColorHistogram {
+// Gathers the colours of a picture into 64 x 64 x 64 cells.
+class ColorCells {
  public:
   Status Open();  // MemoryAllocationError
   void AddRow(const uint8_t* bgr, int32_t width);
@@ -29,6 +29,24 @@ class ColorHistogram {
   };
 
   platform::MemoryBlock cells_;
+};
+
+// Counts each colour of a picture on its own: for pictures of at most kMostColors colours; others are left out.
+class ColorCounts {
+ public:
+  static constexpr uint32_t kMostColors = 65536;
+
+  Status Open();  // MemoryAllocationError
+  void AddRow(const uint8_t* bgr, int32_t width);
+  std::vector<ColorBin> Bins();
+
+ private:
+  struct Slot {
+    uint32_t color, count;  // 0x00RRGGBB; a count of 0 means a free slot
+  };
+
+  platform::MemoryBlock slots_;
+  uint32_t colors_ = 0;
 };
 
 }  // namespace fotomill

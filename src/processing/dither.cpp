@@ -56,12 +56,13 @@ void CutGreyRow(const uint8_t* grey, int32_t width, int32_t threshold, uint8_t* 
   for (int32_t x = 0; x < width; ++x) indices[x] = grey[x] >= threshold;
 }
 
-Status ErrorDiffuser::Open(int32_t width, bool serpentine) {
+Status ErrorDiffuser::Open(int32_t width, bool serpentine, int32_t handedOn) {
   const uint64_t bytes = 3 * (static_cast<uint64_t>(width) + 2) * sizeof(int32_t);
   if (!errors_.Allocate(bytes)) return Status::MemoryAllocationError;
   below_ = errors_.Items<int32_t>().data() + 3;
   width_ = width;
   serpentine_ = serpentine;
+  handedOn_ = handedOn;
   backwards_ = false;
   return Status::Ok;
 }
@@ -86,12 +87,12 @@ void ErrorDiffuser::DiffuseRow(const uint8_t* bgr, NearestColor& nearest, uint8_
     int32_t* below = below_ + 3 * static_cast<std::ptrdiff_t>(x);
     int32_t wanted[3];
     for (int c = 0; c < 3; ++c)
-      wanted[c] = Clamp(bgr[3 * static_cast<std::ptrdiff_t>(x) + c] + ((ahead[c] + below[c] + 8) >> 4));
+      wanted[c] = Clamp(bgr[3 * static_cast<std::ptrdiff_t>(x) + c] + ((ahead[c] + below[c] + 128) >> 8));
     const uint8_t index = nearest.Find(wanted[0], wanted[1], wanted[2]);
     indices[x] = index;
     const int16_t* color = nearest.ColorOf(index);
     for (int c = 0; c < 3; ++c) {
-      const int32_t error = wanted[c] - color[c];
+      const int32_t error = handedOn_ * (wanted[c] - color[c]);
       ahead[c] = 7 * error;
       below[c - 3 * step] = belowLast[c] + 3 * error;
       belowLast[c] = belowHere[c] + 5 * error;
@@ -106,10 +107,10 @@ void ErrorDiffuser::DiffuseGreyRow(const uint8_t* grey, uint8_t* indices) {
   int32_t ahead = 0, belowLast = 0, belowHere = 0;
   int32_t x = step > 0 ? 0 : width_ - 1;
   for (int32_t left = width_; left > 0; --left, x += step) {
-    const int32_t wanted = grey[x] + ((ahead + below_[x] + 8) >> 4);
+    const int32_t wanted = grey[x] + ((ahead + below_[x] + 128) >> 8);
     const bool white = wanted >= 128;
     indices[x] = white;
-    const int32_t error = wanted - (white ? 255 : 0);
+    const int32_t error = handedOn_ * (wanted - (white ? 255 : 0));
     ahead = 7 * error;
     below_[x - step] = belowLast + 3 * error;
     belowLast = belowHere + 5 * error;

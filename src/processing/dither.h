@@ -21,8 +21,9 @@ void CutGreyRow(const uint8_t* grey, int32_t width, int32_t threshold, uint8_t* 
 // Hands each pixel's error on to its neighbours, so it must see all rows from the top down.
 class ErrorDiffuser {
  public:
-  // For rows of `width` pixels; with `serpentine` every other one is taken from the right. MemoryAllocationError.
-  Status Open(int32_t width, bool serpentine);
+  // For rows of `width` pixels; with `serpentine` every other one is taken from the right. A pixel hands on `handedOn`
+  // sixteenths of its error. MemoryAllocationError.
+  Status Open(int32_t width, bool serpentine, int32_t handedOn);
   void Row(const uint8_t* bgr, NearestColor& nearest, uint8_t* indices);
   void GreyRow(const uint8_t* grey, uint8_t* indices);
 
@@ -33,8 +34,8 @@ class ErrorDiffuser {
   void DiffuseGreyRow(const uint8_t* grey, uint8_t* indices);
 
   platform::MemoryBlock errors_;
-  int32_t* below_ = nullptr;  // sixteenths handed down to each pixel of the next row, a spare pixel on both sides
-  int32_t width_ = 0;
+  int32_t* below_ = nullptr;  // 256ths of a level handed down to each pixel of the next row, a spare pixel on both sides
+  int32_t width_ = 0, handedOn_ = 16;
   bool serpentine_ = false, backwards_ = false;
 };
 

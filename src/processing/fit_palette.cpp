@@ -104,65 +104,87 @@ std::vector<Point> CutIntoGroups(std::span<ColorBin> bins, size_t colors) {
   return means;
 }
 
-double Distance(const Point& a, const float (&b)[3]) {
-  double sum = 0;
-  for (size_t i = 0; i < 3; ++i) sum += (a[i] - b[i]) * (a[i] - b[i]);
-  return sum;
+// A bin as the search for the nearest colour wants it.
+std::array<int32_t, 3> PointOf(const ColorBin& bin) {
+  std::array<int32_t, 3> point;
+  for (size_t c = 0; c < 3; ++c) point[c] = static_cast<int32_t>(bin.channel[c] * ColorPoints::kUnits + 0.5f);
+  return point;
 }
 
 // One round: every bin goes to the colour nearest to it, then every colour to the mean of its bins. Returns the squared
 // error before the move.
-double MoveToMeans(std::span<const ColorBin> bins, std::vector<Point>& colors, std::vector<uint8_t>& nearest) {
+double MoveToMeans(std::span<const ColorBin> bins, NearestColor& nearest, ColorPoints& points) {
   struct Sum {
-    Point channel{};
-    double weight = 0;
+    double channel[3] = {}, weight = 0;
   };
-  std::vector<Sum> sums(colors.size());
+  std::array<Sum, 256> sums{};
   double error = 0;
-  for (size_t i = 0; i < bins.size(); ++i) {
-    size_t best = nearest[i];
-    double bestDistance = Distance(colors[best], bins[i].channel);
-    for (size_t c = 0; c < colors.size(); ++c) {
-      const double distance = Distance(colors[c], bins[i].channel);
-      if (distance < bestDistance) {
-        bestDistance = distance;
-        best = c;
-      }
+  nearest.SetColors(points);
+  for (const ColorBin& bin : bins) {
+    const auto at = PointOf(bin);
+    const uint8_t index = nearest.FindPoint(at);
+    Sum& sum = sums[index];
+    sum.weight += bin.weight;
+    double distance = 0;
+    for (size_t c = 0; c < 3; ++c) {
+      sum.channel[c] += static_cast<double>(bin.weight) * bin.channel[c];
+      const int32_t difference = points.channel[index][c] - at[c];
+      distance += kChannelWeight[c] * static_cast<double>(difference * difference);
     }
-    nearest[i] = static_cast<uint8_t>(best);
-    error += bestDistance * bins[i].weight;
-    sums[best].weight += bins[i].weight;
-    for (size_t k = 0; k < 3; ++k) {
-      sums[best].channel[k] += static_cast<double>(bins[i].weight) * bins[i].channel[k];
-    }
+    error += distance * bin.weight;
   }
-  for (size_t c = 0; c < colors.size(); ++c) {
-    if (sums[c].weight <= 0) continue;
-    for (size_t k = 0; k < 3; ++k) colors[c][k] = sums[c].channel[k] / sums[c].weight;
+  for (size_t i = 0; i < static_cast<size_t>(points.count); ++i) {
+    if (sums[i].weight <= 0) continue;
+    for (size_t c = 0; c < 3; ++c) {
+      points.channel[i][c] =
+          static_cast<int32_t>(std::lround(sums[i].channel[c] / sums[i].weight * ColorPoints::kUnits));
+    }
   }
   return error;
 }
 
 }  // namespace
 
-int32_t FitPalette(std::vector<ColorBin>& bins, int32_t colors, Palette& palette) {
-  palette.fill(0);
-  if (bins.empty()) return 0;
-  std::vector<Point> points = CutIntoGroups(bins, static_cast<size_t>(colors));
-  std::vector<uint8_t> nearest(bins.size(), 0);
-  double last = MoveToMeans(bins, points, nearest);
+Status FitPalette(const std::vector<ColorBin>& bins, int32_t colors, ColorPoints& points) {
+  points.count = 0;
+  if (bins.empty()) return Status::Ok;
+  std::vector<ColorBin> weighed = bins;  // as distances count
+  for (ColorBin& bin : weighed) {
+    for (size_t c = 0; c < 3; ++c) bin.channel[c] *= std::sqrt(static_cast<float>(kChannelWeight[c]));
+  }
+  for (const Point& mean : CutIntoGroups(weighed, static_cast<size_t>(colors))) {
+    auto& point = points.channel[static_cast<size_t>(points.count++)];
+    for (size_t c = 0; c < 3; ++c) {
+      point[c] = static_cast<int32_t>(std::lround(mean[c] / std::sqrt(kChannelWeight[c]) * ColorPoints::kUnits));
+    }
+  }
+  NearestColor nearest;
+  RETURN_IF_BAD(nearest.Open(false));
+  double last = MoveToMeans(bins, nearest, points);
   for (int round = 1; round < kMostRounds; ++round) {
-    const double error = MoveToMeans(bins, points, nearest);
+    const double error = MoveToMeans(bins, nearest, points);
     if (error > last * (1 - kWorthAnother)) break;
     last = error;
   }
-  std::sort(points.begin(), points.end(), [](const Point& a, const Point& b) {
-    return 114 * a[0] + 587 * a[1] + 299 * a[2] < 114 * b[0] + 587 * b[1] + 299 * b[2];
-  });
-  for (size_t i = 0; i < points.size(); ++i) {
-    for (size_t c = 0; c < 3; ++c) palette[3 * i + c] = static_cast<uint8_t>(std::lround(points[i][2 - c]));
+  return Status::Ok;
+}
+
+void ColorMeans::AddRow(const uint8_t* bgr, const uint8_t* indices, int32_t width) {
+  for (int32_t x = 0; x < width; ++x, bgr += 3) {
+    Sum& sum = sums_[indices[x]];
+    for (int c = 0; c < 3; ++c) sum.channel[c] += bgr[c];
+    ++sum.count;
   }
-  return static_cast<int32_t>(points.size());
+}
+
+void ColorMeans::Move(ColorPoints& points) const {
+  for (size_t i = 0; i < static_cast<size_t>(points.count); ++i) {
+    if (sums_[i].count == 0) continue;
+    for (size_t c = 0; c < 3; ++c) {
+      points.channel[i][c] =
+          static_cast<int32_t>((sums_[i].channel[c] * ColorPoints::kUnits + sums_[i].count / 2) / sums_[i].count);
+    }
+  }
 }
 
 }  // namespace fotomill

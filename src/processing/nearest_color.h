@@ -1,5 +1,8 @@
 #pragma once
 
+#include <algorithm>
+#include <array>
+#include <cfloat>
 #include <cstdint>
 
 #include "core/status.h"
@@ -8,27 +11,86 @@
 
 namespace fotomill {
 
-// Answers which of a palette's colours is nearest to a given one, by squared distance. Answers are kept for cells of
-// 4 x 4 x 4 colours, each worked out for its middle when first asked for.
+// Colours that need not be whole: blue, green and red in sixteenths of a level.
+struct ColorPoints {
+  static constexpr int32_t kUnits = 16;  // of a level
+  int32_t count = 0;
+  std::array<std::array<int32_t, 3>, 256> channel{};
+};
+
+// Points from the first `count` colours of a palette, and back, rounded.
+ColorPoints PointsOf(const Palette& palette, int32_t count);
+Palette PaletteOf(const ColorPoints& points);
+
+// How much a squared difference of blue, green and red counts: about as the eye notices it, yet even enough that plain
+// errors stay small as well.
+inline constexpr int32_t kChannelWeight[3] = {5, 10, 7};
+
+// Answers which of up to 256 colours is nearest to a given one, exactly. The cube of colours is divided into cells
+// of 16 levels, and those into cells of 4; each keeps the few colours that can be nearest to anything in it, worked out
+// when the cell is first asked for.
 class NearestColor {
  public:
-  // The first `count` colours of the palette, 1 to 256. MemoryAllocationError.
-  Status Open(const Palette& palette, int32_t count);
+  // Where only FindPoint is wanted, the fine cells are left out. MemoryAllocationError.
+  Status Open(bool fine);
+  // The colours to choose from from now on, at least one. Find takes them in whole levels.
+  void SetColors(const ColorPoints& points);
+
+  // The colour nearest to blue, green, red, 0 to 255.
   uint8_t Find(int32_t blue, int32_t green, int32_t red) {
-    const int32_t cell = (red >> 2) << 12 | (green >> 2) << 6 | blue >> 2;
-    const uint16_t known = cells_[cell];
-    return static_cast<uint8_t>(known != 0 ? known - 1 : Search(cell));
+    const uint32_t cell = static_cast<uint32_t>((red >> 2) << 12 | (green >> 2) << 6 | blue >> 2);
+    const uint32_t known = fine_[cell] != kUnknown ? fine_[cell] : FillFine(cell);
+    return known < 256 ? static_cast<uint8_t>(known) : Search(blue, green, red, known >> 8);
   }
-  // Blue, green and red of an index.
-  const int16_t* ColorOf(uint8_t index) const { return colors_[index]; }
+  // The colour nearest to a point.
+  uint8_t FindPoint(const std::array<int32_t, 3>& point);
+  // A colour in whole levels.
+  const int16_t* ColorOf(uint8_t index) const { return levels_[index]; }
 
  private:
-  uint8_t Search(int32_t cell);
+  static constexpr uint32_t kUnknown = 0xffffffff;
+  static constexpr uint32_t kMostGroups = 200'000;  // 16 MB; beyond, cells do with their middle's nearest colour
+  static constexpr size_t kCoarseList = 257;  // a count, less one, and as many indices
 
-  platform::MemoryBlock block_;
-  uint16_t* cells_ = nullptr;  // index + 1, 0 where not yet known
-  int32_t count_ = 0;
-  int16_t colors_[256][4] = {};
+  // Four colours of a fine cell's list. A colour's squared distance from a point, less what all colours have in common
+  // there, is linear in the point: constant - factor x channel. Four times that, with the colour's place in the group
+  // added, is a whole number below 2^24, so the least one, exact in a float, names the nearest colour.
+  struct Group {
+    using Four [[gnu::vector_size(16)]] = float;
+    Four factor[3], constant;
+    uint8_t index[4];
+    uint32_t groupsLeft;  // of this list, behind this one
+    uint64_t unused;
+  };
+
+  uint8_t Search(int32_t blue, int32_t green, int32_t red, uint32_t place) const {
+    const Group* group = groups_ + place;
+    float best = FLT_MAX;
+    uint8_t index = 0;
+    for (uint32_t left = group->groupsLeft + 1; left > 0; --left, ++group) {
+      const Group::Four four = group->constant - group->factor[0] * static_cast<float>(blue) -
+                               group->factor[1] * static_cast<float>(green) - group->factor[2] * static_cast<float>(red);
+      const Group::Four crossed = __builtin_shufflevector(four, four, 2, 3, 0, 1);
+      const Group::Four two = four < crossed ? four : crossed;
+      const float least = two[0] < two[1] ? two[0] : two[1];
+      if (least < best) {
+        best = least;
+        index = group->index[static_cast<int32_t>(least) & 3];
+      }
+    }
+    return index;
+  }
+  const uint8_t* CoarseList(uint32_t cell);
+  uint32_t FillFine(uint32_t cell);
+  uint32_t StoreGroups(const uint8_t* list, uint32_t groups);
+
+  ColorPoints points_;
+  int16_t levels_[256][4] = {};
+  platform::MemoryBlock fineBlock_, coarseBlock_, groupBlock_;
+  uint32_t* fine_ = nullptr;  // the only index, or (place in `groups_`) << 8
+  Group* groups_ = nullptr;
+  uint32_t groupsUsed_ = 0;
+  std::array<bool, 4096> coarseKnown_{};
 };
 
 }  // namespace fotomill

@@ -16,7 +16,16 @@ namespace fotomill {
 
 namespace {
 
-constexpr int32_t kWhole = 100;  // per cent
+constexpr int32_t kWhole = 100;              // per cent
+constexpr int kRefinements = 3;              // rounds in which the pixels themselves move the palette's colours
+constexpr int64_t kRefinedPixels = 200'000;  // about as many pixels take part
+constexpr int32_t kFewCells = 1024;          // a picture of fewer cells of colours has its colours counted one by one
+
+// Sixteenths of its error that a pixel hands on. All of it keeps the mean of black and white. A palette that was fitted
+// to the picture does not reach its outermost colours, and errors that it can never make up for would grow into noise;
+// less is handed on there, the less the closer the colours lie.
+constexpr int32_t kHandedOnMono = 16, kHandedOnFew = 12, kHandedOnMany = 10;
+constexpr int32_t kFew = 16;  // colours
 
 // Brightness 0 to 255 (ITU-R BT.601); of a grey it is the grey itself.
 constexpr uint8_t Brightness(const uint8_t* bgr) {
@@ -113,6 +122,12 @@ Palette EvenGreys(int32_t count) {
   return palette;
 }
 
+void SortByBrightness(ColorPoints& points) {
+  const auto brightness = [](const auto& bgr) { return 29 * bgr[0] + 150 * bgr[1] + 77 * bgr[2]; };
+  std::sort(points.channel.begin(), points.channel.begin() + points.count,
+            [&](const auto& a, const auto& b) { return brightness(a) < brightness(b); });
+}
+
 // A picture being reduced: where its rows come from and what it becomes.
 struct Reduction {
   PictureRecord& picture;
@@ -122,6 +137,7 @@ struct Reduction {
   platform::MemoryBlock indices;  // one row
   PackedImage made;
   Palette palette{};
+  int32_t colors = 2;
 
   int32_t Width() const { return picture.image.Width(); }
   int32_t Height() const { return picture.image.Height(); }
@@ -136,7 +152,7 @@ Status ReduceToMono(Reduction& work) {
   platform::MemoryBlock grey;
   if (!grey.Allocate(static_cast<uint64_t>(width), platform::Fill::Unset)) return Status::MemoryAllocationError;
   ErrorDiffuser diffuser;
-  RETURN_IF_BAD(diffuser.Open(width, work.options.serpentine));
+  RETURN_IF_BAD(diffuser.Open(width, work.options.serpentine, kHandedOnMono));
   int32_t threshold = work.options.threshold;
   if (work.options.monoDither == Dither::None && threshold == 0) {
     std::array<uint64_t, 256> counts{};
@@ -164,28 +180,59 @@ Status ReduceToMono(Reduction& work) {
   return Status::Ok;
 }
 
-// The palette for more than two colours; `count` becomes the number of its colours.
-Status ChoosePalette(Reduction& work, int32_t& count) {
-  const int32_t most = 1 << work.bits;
-  if (work.options.greys) {
-    count = work.options.greyLevels == 0 ? most : std::min(most, work.options.greyLevels);
-    work.palette = EvenGreys(count);
-    return Status::Ok;
-  }
-  ColorHistogram histogram;
+template <typename Histogram>
+Status GatherColors(Reduction& work, std::vector<ColorBin>& bins) {
+  Histogram histogram;
   RETURN_IF_BAD(histogram.Open());
   for (int32_t y = 0; y < work.Height(); ++y) histogram.AddRow(work.source.Row(y), work.Width());
-  std::vector<ColorBin> bins = histogram.Bins();
-  count = FitPalette(bins, most, work.palette);
+  bins = histogram.Bins();
   return Status::Ok;
 }
 
-Status ReduceToPalette(Reduction& work, int32_t count) {
-  NearestColor nearest;
-  RETURN_IF_BAD(nearest.Open(work.palette, count));
+// Takes the pixels themselves to the colours nearest to them, and the colours to their means.
+Status RefineOnPixels(Reduction& work, NearestColor& nearest, ColorPoints& points) {
+  const int64_t pixels = static_cast<int64_t>(work.Width()) * work.Height();
+  const auto step = static_cast<int32_t>(pixels / kRefinedPixels + 1);
+  for (int round = 0; round < kRefinements; ++round) {
+    nearest.SetColors(PointsOf(PaletteOf(points), points.count));
+    ColorMeans means;
+    for (int32_t y = step / 2; y < work.Height(); y += step) {
+      const uint8_t* row = work.source.Row(y);
+      MapRow(row, work.Width(), nearest, work.indices.Data());
+      means.AddRow(row, work.indices.Data(), work.Width());
+    }
+    means.Move(points);
+  }
+  return Status::Ok;
+}
+
+// Puts the palette for more than two colours into `work`, and its colours into `nearest`.
+Status ChoosePalette(Reduction& work, NearestColor& nearest) {
+  const int32_t most = 1 << work.bits;
+  RETURN_IF_BAD(nearest.Open(true));
+  ColorPoints points;
+  if (work.options.greys) {
+    const int32_t count = work.options.greyLevels == 0 ? most : std::min(most, work.options.greyLevels);
+    points = PointsOf(EvenGreys(count), count);
+  } else {
+    std::vector<ColorBin> bins;
+    RETURN_IF_BAD(GatherColors<ColorCells>(work, bins));
+    if (bins.size() < kFewCells) RETURN_IF_BAD(GatherColors<ColorCounts>(work, bins));
+    RETURN_IF_BAD(FitPalette(bins, most, points));
+    RETURN_IF_BAD(RefineOnPixels(work, nearest, points));
+    SortByBrightness(points);
+  }
+  work.palette = PaletteOf(points);
+  work.colors = points.count;
+  nearest.SetColors(PointsOf(work.palette, points.count));
+  return Status::Ok;
+}
+
+Status ReduceToPalette(Reduction& work, NearestColor& nearest) {
   ErrorDiffuser diffuser;
-  RETURN_IF_BAD(diffuser.Open(work.Width(), work.options.serpentine));
-  const int32_t spacing = PaletteSpacing(work.palette, count);
+  RETURN_IF_BAD(
+      diffuser.Open(work.Width(), work.options.serpentine, work.colors <= kFew ? kHandedOnFew : kHandedOnMany));
+  const int32_t spacing = PaletteSpacing(work.palette, work.colors);
   for (int32_t y = 0; y < work.Height(); ++y) {
     const uint8_t* row = work.source.Row(y);
     switch (work.options.colorDither) {
@@ -238,14 +285,14 @@ Status ReduceColors(PictureRecord& picture, int32_t maxBits, const ReduceOptions
   RETURN_IF_BAD(work.source.Open(picture.image, options));
   if (!work.indices.Allocate(static_cast<uint64_t>(work.Width()), platform::Fill::Unset))
     return Status::MemoryAllocationError;
-  int32_t count = 2;
+  NearestColor nearest;
   if (bits == 1) {
     work.palette = EvenGreys(2);
   } else {
-    RETURN_IF_BAD(ChoosePalette(work, count));
+    RETURN_IF_BAD(ChoosePalette(work, nearest));
   }
   RETURN_IF_BAD(NewPackedImage(work.Width(), work.Height(), &work.palette, bits, work.made));
-  RETURN_IF_BAD(bits == 1 ? ReduceToMono(work) : ReduceToPalette(work, count));
+  RETURN_IF_BAD(bits == 1 ? ReduceToMono(work) : ReduceToPalette(work, nearest));
   picture.image = std::move(work.made);
   picture.palette = work.palette;
   picture.bitsPerPixel = bits;

@@ -38,6 +38,6 @@ ReduceOptions ReduceOptionsFromSettings();
 // to the picture (black and white for 1 bit) and the pixels are dithered as the options say. Without a picture:
 // EmptyImage. MemoryAllocationError when a block cannot be had; `image` is then whole, but may be flattened.
 Status ReduceColors(PictureRecord& picture, int32_t maxBits, const ReduceOptions& options);
-Status ReduceColors(PictureRecord& picture, int32_t maxBits);  // as the settings say
+Status ReduceColors(PictureRecord& picture, int32_t maxBits);  // as ReduceOptionsFromSettings says
 
 }  // namespace fotomill

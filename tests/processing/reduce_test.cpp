@@ -1,7 +1,11 @@
 #include "processing/reduce.h"
 
 #include <cmath>
+#include <random>
+#include <set>
 
+#include "platform/fault.h"
+#include "processing/nearest_color.h"
 #include "processing/pictures.h"
 
 namespace fotomill {
@@ -114,6 +118,143 @@ TEST(Reduce, AlphaGoesToTheBackgroundFirst) {
   ASSERT_EQ(ReduceColors(*picture, 8), Status::Ok);
   EXPECT_TRUE(picture->alpha.Empty());
   EXPECT_EQ(Colors(*picture), std::vector<uint32_t>(400, 0x302010));
+}
+
+// Peak signal to noise in dB.
+double Likeness(const std::vector<uint32_t>& a, const std::vector<uint32_t>& b) {
+  double error = 0;
+  for (size_t i = 0; i < a.size(); ++i) {
+    for (int c = 0; c < 3; ++c)
+      error += std::pow(static_cast<int>(a[i] >> (8 * c) & 255) - static_cast<int>(b[i] >> (8 * c) & 255), 2);
+  }
+  return 10 * std::log10(255.0 * 255.0 * 3 * static_cast<double>(a.size()) / error);
+}
+
+// Limits a little below what was reached when they were set: the palette's quality must not slip unnoticed.
+TEST(Reduce, PalettesStayTrueToThePicture) {
+  const auto waves = [](int32_t x, int32_t y) {
+    const auto level = [](double t) { return static_cast<uint32_t>(127.5 + 120 * std::sin(t)); };
+    return level(x / 40.0) << 16 | level(y / 30.0 + 1) << 8 | level((x + y) / 70.0);
+  };
+  // Two clusters of like colours, far apart.
+  const auto clusters = [](int32_t x, int32_t y) {
+    const uint32_t noise = test::Scatter(x, y);
+    return (x < 100 ? 0x181410u : 0xd8d0e0u) + ((noise & 7) << 16 | (noise >> 3 & 7) << 8 | (noise >> 6 & 7));
+  };
+  struct Row {
+    const char* name;
+    uint32_t (*colorAt)(int32_t, int32_t);
+    int32_t bits;
+    Dither dither;
+    double least;
+  };
+  const Row rows[] = {
+      {"waves, 256 colours", waves, 8, Dither::None, 32.4},
+      {"waves, 256 colours, diffused", waves, 8, Dither::FloydSteinberg, 31.0},
+      {"waves, 256 colours, ordered", waves, 8, Dither::Ordered, 30.2},
+      {"waves, 16 colours", waves, 4, Dither::None, 21.4},
+      {"waves, 16 colours, diffused", waves, 4, Dither::FloydSteinberg, 19.8},
+      {"clusters, 256 colours", clusters, 8, Dither::None, 53.2},
+  };
+  for (const Row& row : rows) {
+    SCOPED_TRACE(row.name);
+    const PicturePointer picture = MakePicture(200, 160, row.colorAt);
+    const std::vector<uint32_t> before = Colors(*picture);
+    ReduceOptions options;
+    options.colorDither = row.dither;
+    ASSERT_EQ(ReduceColors(*picture, row.bits, options), Status::Ok);
+    const std::vector<uint32_t> after = Colors(*picture);
+    EXPECT_GT(Likeness(before, after), row.least);
+    EXPECT_GT(std::set(after.begin(), after.end()).size(), (1u << row.bits) * 9 / 10);
+  }
+}
+
+TEST(Reduce, NearestColorIsNearest) {
+  std::mt19937 random(11);
+  for (const int32_t count : {1, 2, 16, 255, 256}) {
+    for (const int32_t range : {256, 40, 3}) {  // the narrower, the more colours share a cell
+      SCOPED_TRACE(testing::Message() << count << " colours within " << range);
+      Palette palette{};
+      for (uint8_t& level : palette)
+        level = static_cast<uint8_t>((256 - range) / 2 + static_cast<int32_t>(random() % static_cast<uint32_t>(range)));
+      NearestColor nearest;
+      ASSERT_EQ(nearest.Open(true), Status::Ok);
+      nearest.SetColors(PointsOf(palette, count));
+      const auto distance = [&](int32_t i, const int32_t(&bgr)[3]) {
+        int32_t sum = 0;
+        for (int c = 0; c < 3; ++c)
+          sum += kChannelWeight[c] *
+                 static_cast<int32_t>(std::pow(palette[static_cast<size_t>(3 * i + 2 - c)] - bgr[c], 2));
+        return sum;
+      };
+      for (int k = 0; k < 4000; ++k) {
+        const int32_t bgr[3] = {static_cast<int32_t>(random() & 255), static_cast<int32_t>(random() & 255),
+                                static_cast<int32_t>(random() & 255)};
+        int32_t least = INT32_MAX;
+        for (int32_t i = 0; i < count; ++i) least = std::min(least, distance(i, bgr));
+        ASSERT_EQ(distance(nearest.Find(bgr[0], bgr[1], bgr[2]), bgr), least);
+        ASSERT_EQ(distance(nearest.FindPoint({16 * bgr[0], 16 * bgr[1], 16 * bgr[2]}), bgr), least);
+      }
+    }
+  }
+}
+
+TEST(Reduce, GreysAreEvenAndOnlyGreys) {
+  for (const int32_t levels : {0, 2, 5}) {
+    SCOPED_TRACE(levels);
+    const PicturePointer picture = Sweep(90, 70);
+    ReduceOptions options;
+    options.greys = true;
+    options.greyLevels = levels;
+    ASSERT_EQ(ReduceColors(*picture, 4, options), Status::Ok);
+    std::set<uint32_t> used;
+    for (const uint32_t color : Colors(*picture)) used.insert(color);
+    for (const uint32_t color : used) EXPECT_EQ(color, Grey(static_cast<int32_t>(color & 255)));
+    EXPECT_LE(used.size(), static_cast<size_t>(levels == 0 ? 16 : levels));
+    EXPECT_GE(used.size(), static_cast<size_t>(levels == 0 ? 14 : levels));
+  }
+}
+
+TEST(Reduce, AdjustmentsMoveTheMean) {
+  struct Row {
+    const char* name;
+    int32_t brightness, contrast;
+    double mean;
+  };
+  for (const Row& row : {Row{"as it is", 0, 0, 63.5},
+                         {"brighter", 20, 0, 114.5},
+                         {"darker", -100, 0, 0},
+                         {"all grey", 0, -100, 128},
+                         {"doubled", 0, 100, 31.75}}) {
+    SCOPED_TRACE(row.name);
+    const PicturePointer picture = MakePicture(256, 64, [](int32_t x, int32_t) { return Grey(x / 2); });
+    ReduceOptions options;
+    options.brightness = row.brightness;
+    options.contrast = row.contrast;
+    ASSERT_EQ(ReduceColors(*picture, 1, options), Status::Ok);
+    double sum = 0;
+    for (const uint32_t color : Colors(*picture)) sum += color & 255;
+    EXPECT_NEAR(sum / (256 * 64), row.mean, 3);
+  }
+}
+
+TEST(Reduce, NoMemoryLeavesThePictureWhole) {
+  for (const int32_t bits : {1, 4, 8}) {
+    SCOPED_TRACE(bits);
+    const PicturePointer picture = Sweep(40, 30);
+    const std::vector<uint32_t> before = Colors(*picture);
+    Status status = Status::MemoryAllocationError;
+    for (int64_t failing = 1; status != Status::Ok && failing < 100; ++failing) {
+      platform::faultCountdown = failing;
+      status = ReduceColors(*picture, bits);
+      platform::faultCountdown = 0;
+      if (status == Status::Ok) break;
+      EXPECT_EQ(status, Status::MemoryAllocationError);
+      EXPECT_EQ(picture->bitsPerPixel, 24);
+      EXPECT_EQ(Colors(*picture), before);
+    }
+    EXPECT_EQ(picture->bitsPerPixel, bits);
+  }
 }
 
 }  // namespace
