@@ -15,6 +15,7 @@
 #include "core/plain_name.h"
 #include "core/settings.h"
 #include "core/text.h"
+#include "metadata/picture_exif.h"
 #include "picture/registry.h"
 #include "platform/files.h"
 #include "platform/paths.h"
@@ -36,6 +37,8 @@ struct ConvertOptions {
   int32_t page = 1;     // from 1
   uint32_t jobs = 0;
   bool reduce = false;
+  bool autoOrient = false;
+  bool verbose = false;
   bool keepTree = false;
   bool keepTimes = false;
   bool dryRun = false;
@@ -175,7 +178,8 @@ class Conversion {
     RETURN_IF_BAD(LoadPictureInfo(name.c_str(), picture));
     picture->page = options_.page - 1;
     if (options_.dryRun) return options_.page > picture->pageCount ? Status::NoImages : Status::Ok;
-    return ReadPicture(*picture);
+    RETURN_IF_BAD(ReadPicture(*picture));
+    return options_.autoOrient ? TurnUpright(*picture) : Status::Ok;
   }
 
   std::string LoadHint(const std::string& name, Status status, const PictureRecord* picture) const {
@@ -213,9 +217,21 @@ class Conversion {
       if (lostRace) continue;  // someone else took the name since it was found free
       if (status != Status::Ok) return {status, WriteHint(*destination, status), {}, false};
       names_.Remember(*destination);
+      NoteLostMetadata(file, picture);
       return AfterWriting(file, *destination);
     }
     return {Status::ErrorCreatingFile, kNoNumberHint, {}, false};
+  }
+
+  // Metadata that the format cannot hold are not lost in silence, for who wants to know.
+  void NoteLostMetadata(const SelectedFile& file, const PictureRecord& picture) {
+    if (!options_.verbose || options_.metadata != "keep" || picture.metadata.Empty() || KeepsMetadata(row_)) return;
+    std::string lost;
+    if (!picture.metadata.exif.empty()) lost += ", EXIF";
+    if (!picture.metadata.xmp.empty()) lost += ", XMP";
+    if (!picture.metadata.icc.empty()) lost += ", color profile";
+    output_.Note(output_.ShownMessage(file.name) + ": " + std::string(row_.extension.view()) + " cannot hold its " +
+                 lost.substr(2) + ".");
   }
 
   Outcome AfterWriting(const SelectedFile& file, const std::string& destination) const {
@@ -232,6 +248,7 @@ class Conversion {
     write.existing = replace ? platform::Existing::Replace : platform::Existing::Refuse;
     write.keepMetadata = options_.metadata == "keep";
     const PathText source = picture.fileName;
+    RefreshExif(picture);
     Status status = WritePictureAs(picture, destination, rowIndex_, write);
     for (const int32_t bits : {8, 4, 1}) {
       if (status != Status::TooManyColors || !options_.reduce) break;
@@ -332,6 +349,7 @@ void SetUpConvert(CLI::App& app, CommandContext& context) {
   app.add_option("--metadata", options->metadata, "Keep or strip EXIF, XMP and colour profiles")
       ->option_text("HOW")
       ->check(CLI::IsMember({"keep", "strip"}));
+  app.add_flag("--auto-orient", options->autoOrient, "Turn pictures upright as their EXIF says");
   app.add_flag("--reduce", options->reduce, "Reduce the colours of pictures that are too deep for the format");
   app.add_option("--quality", options->quality, "Of JPEG and WebP, 1 to 100")
       ->option_text("N")
@@ -342,6 +360,7 @@ void SetUpConvert(CLI::App& app, CommandContext& context) {
   app.add_option("-j,--jobs", options->jobs, "Pictures at work at a time; 0, the default, is one a core")
       ->option_text("N");
   app.add_flag("-n,--dry-run", options->dryRun, "Only print what would be done");
+  app.add_flag("-v,--verbose", options->verbose, "Say when a format cannot hold a picture's metadata");
   app.add_flag("--json", options->json, "One JSON array of {file, destination, status, message}");
   app.footer("Example: fotomill convert holiday -r --to png --dest out --keep-tree");
   context.run = [options, &context] { return RunConvert(*options, context); };

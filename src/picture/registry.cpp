@@ -1,5 +1,6 @@
 #include "picture/registry.h"
 
+#include <algorithm>
 #include <array>
 #include <iterator>
 
@@ -296,6 +297,11 @@ std::string_view WhyNot(const FormatEntry& row) {
   if (row.write == NeverWritten) return "Files of this format can only be read.";
   if (!CanWrite(row)) return "This build cannot write the format.";
   return {};
+}
+
+bool KeepsMetadata(const FormatEntry& row) {
+  constexpr WriteOperation kWriters[] = {JpegWrite, PngWrite};
+  return std::find(std::begin(kWriters), std::end(kWriters), row.write) != std::end(kWriters);
 }
 
 void RunFormatStartup() {

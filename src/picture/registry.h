@@ -104,6 +104,9 @@ bool CanStartUp(const FormatEntry& row);
 // Why a row cannot be read or cannot be written here, in one sentence; empty when both work.
 std::string_view WhyNot(const FormatEntry& row);
 
+// Whether files of the row can hold a picture's EXIF, XMP and color profile.
+bool KeepsMetadata(const FormatEntry& row);
+
 // Call `startup`, or `shutdown`, of every row that has one, in row order.
 void RunFormatStartup();
 void RunFormatShutdown();
