@@ -1,7 +1,7 @@
 // The layouts that modules see, checked byte by byte where pointers have 4 bytes, and shifted by the wider pointers where
 // they have 8.
 
-#include <cstddef>
+#include <stddef.h>  // not <cstddef>: this file also compiles without a system, for the other pointer width
 
 #include "plugins/fotomill_plugin.h"
 

@@ -5,6 +5,7 @@
 #include <utility>
 #include <vector>
 
+#include "core/settings.h"
 #include "core/text.h"
 #include "picture/registry.h"
 #include "platform/files.h"
@@ -157,6 +158,7 @@ bool PluginCanHandle(std::string_view fileName) {
 }
 
 bool ConfigurePlugin(int32_t index) {
+  if (index >= 0 && index < PluginFormatCount()) settings.PluginConfigIndex = index;
   if (index < 0 || index >= PluginFormatCount() || PluginRow(index).exports.configure == nullptr) return false;
   FMW_CONFIGURE block = {};
   block.size = sizeof block;

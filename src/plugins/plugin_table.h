@@ -60,7 +60,7 @@ bool PluginCanHandle(std::string_view fileName);
 // when a list asks for them, never before. `folder` as for ScanPlugins.
 void EnablePlugins(const std::string& folder = {});
 
-// Calls a row's own settings dialog. False when the module offers none; the text to show then is kNothingToConfigure.
+// Calls a row's own settings dialog, and remembers the row in `PluginConfigIndex`. False when the module offers none; the text to show then is kNothingToConfigure.
 bool ConfigurePlugin(int32_t index);
 inline constexpr std::string_view kNothingToConfigure =
     "No configuration items are available for the selected plugin.";
