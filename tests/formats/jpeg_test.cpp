@@ -1,0 +1,123 @@
+#include "formats/jpeg.h"
+
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+
+#include "core/choice_lists.h"
+#include "core/settings.h"
+#include "support/codecs.h"
+#include "support/files.h"
+#include "support/hex.h"
+#include "support/scoped_settings.h"
+
+namespace fotomill::test {
+namespace {
+
+using Bytes = std::vector<uint8_t>;
+
+// Slow changes of colour, which JPEG keeps closely.
+PicturePointer SmoothPicture(int32_t width, int32_t height) {
+  PicturePointer picture = PatternPicture(width, height, 24);
+  for (int32_t y = 0; y < height; ++y) {
+    for (int32_t x = 0; x < width; ++x) {
+      SetPixel(picture->image, x, y, (x * 255 / width) << 16 | (y * 255 / height) << 8 | (255 - x * 255 / width));
+    }
+  }
+  return picture;
+}
+
+int32_t LargestError(const PackedImage& a, const PackedImage& b) {
+  int32_t largest = 0;
+  for (int32_t y = 0; y < a.Height(); ++y) {
+    for (int32_t x = 0; x < a.Width(); ++x) {
+      for (const int32_t shift : {0, 8, 16}) {
+        largest = std::max(largest, std::abs((a.PixelAt(x, y) >> shift & 255) - (b.PixelAt(x, y) >> shift & 255)));
+      }
+    }
+  }
+  return largest;
+}
+
+TEST(Jpeg, PicturesComeBackCloselyInEveryForm) {
+  const ScopedSettings scoped;
+  const PicturePointer picture = SmoothPicture(65, 49);
+  settings.JpegCompression = 95;
+  for (const int32_t sampling : {choice::kSubsample444, choice::kSubsample422, choice::kSubsample420}) {
+    for (const int32_t progressive : {0, 1}) {
+      SCOPED_TRACE(std::to_string(sampling) + (progressive != 0 ? " progressive" : ""));
+      settings.JpegSubsample = sampling;
+      settings.WriteJpegProgressive = progressive;
+      const Decoded back = Decode(JpegRead, Encode(JpegWrite, *picture));
+      ASSERT_EQ(back.status, Status::Ok);
+      EXPECT_EQ(back.picture->typeName.view(), progressive != 0 ? "Progressive JPEG" : "JPEG");
+      EXPECT_LE(LargestError(picture->image, back.picture->image), 16);
+    }
+  }
+}
+
+TEST(Jpeg, GreysStayGrey) {
+  const PicturePointer picture = PatternPicture(9, 5, 8);
+  picture->palette = GreyRamp();
+  const Decoded back = Decode(JpegRead, Encode(JpegWrite, *picture));
+  ASSERT_EQ(back.status, Status::Ok);
+  EXPECT_EQ(back.picture->bitsPerPixel, 8);
+}
+
+TEST(Jpeg, MetadataTravel) {
+  const ScopedSettings scoped;
+  settings.JpegStoreDPI = 1;
+  const PicturePointer picture = SmoothPicture(8, 8);
+  picture->metadata.exif = Hex("49492A00 08000000 0000 00000000");
+  picture->metadata.xmp = {'<', 'x', '/', '>'};
+  picture->metadata.icc.resize(150000);  // three segments
+  for (size_t i = 0; i < picture->metadata.icc.size(); ++i) picture->metadata.icc[i] = static_cast<uint8_t>(i * 7 >> 3);
+  picture->metadata.dpiX = picture->metadata.dpiY = 200;
+  picture->comment = {'h', 'i'};
+  const Decoded back = Decode(JpegRead, Encode(JpegWrite, *picture));
+  ASSERT_EQ(back.status, Status::Ok);
+  EXPECT_EQ(back.picture->metadata.exif, picture->metadata.exif);
+  EXPECT_EQ(back.picture->metadata.xmp, picture->metadata.xmp);
+  EXPECT_EQ(back.picture->metadata.icc, picture->metadata.icc);
+  EXPECT_EQ(back.picture->metadata.dpiX, 200);
+  EXPECT_EQ(back.picture->comment, picture->comment);
+}
+
+TEST(Jpeg, FilesThatEndTooEarlyFail) {
+  const Bytes file = Encode(JpegWrite, *PatternPicture(64, 64, 24));
+  const std::span<const uint8_t> whole(file);
+  EXPECT_EQ(Decode(JpegRead, whole.first(file.size() / 2)).status, Status::FileReadError);
+  EXPECT_EQ(Decode(JpegRead, whole.first(file.size() - 2)).status, Status::Ok) << "only the end marker is missing";
+  EXPECT_EQ(Decode(JpegRead, whole.first(30)).status, Status::FileReadError);
+  EXPECT_EQ(Decode(JpegRead, Hex("FFD8FFD9")).status, Status::DamagedFile);
+  EXPECT_EQ(Decode(JpegRead, Hex("47494638")).status, Status::DamagedFile);
+}
+
+TEST(Jpeg, FaultsThatArePassedOverAreTold) {
+  Bytes file = Encode(JpegWrite, *PatternPicture(64, 64, 24));
+  const size_t middle = file.size() * 3 / 4;
+  file[middle] = 0xFF;
+  file[middle + 1] = 0xD9;  // an end marker in the middle of the scan
+  const Decoded back = Decode(JpegRead, file);
+  EXPECT_EQ(back.status, Status::Ok);
+  EXPECT_FALSE(back.picture->warning.empty());
+}
+
+TEST(Jpeg, ThumbnailsDecodeAtTheSmallestSizeThatServes) {
+  TemporaryFolder folder;
+  WriteBytes(folder.Path("a.jpg"), Encode(JpegWrite, *SmoothPicture(800, 600)));
+  struct Row {
+    int32_t side, width;
+  };
+  for (const Row& row : {Row{0, 800}, Row{96, 200}, Row{50, 100}, Row{10, 100}, Row{201, 800}, Row{200, 400}}) {
+    SCOPED_TRACE(row.side);
+    const PicturePointer picture = NewPictureRecord();
+    picture->thumbnailSide = row.side;
+    ASSERT_EQ(JpegRead(*picture, folder.Path("a.jpg").c_str()), Status::Ok);
+    EXPECT_EQ(picture->image.Width(), row.width);
+    EXPECT_EQ(picture->width, 800);
+  }
+}
+
+}  // namespace
+}  // namespace fotomill::test
