@@ -6,6 +6,7 @@
 #include "cli/doctor.h"
 #include "cli/exif.h"
 #include "cli/formats.h"
+#include "cli/history.h"
 #include "cli/info.h"
 #include "cli/match.h"
 #include "cli/plugins.h"
@@ -29,6 +30,9 @@ constexpr Command kCommands[] = {
     {"config set",   "give a key a value",                                     Needs::Settings, SetUpConfigSet},
     {"config unset", "give a key its default again",                           Needs::Settings, SetUpConfigUnset},
     {"config path",  "print where the configuration file is",                  Needs::Settings, SetUpConfigPath},
+    {"history list",  "list the files used last, and what for",               Needs::Settings, SetUpHistoryList},
+    {"history add",   "record in the file history that a file was used",       Needs::Settings, SetUpHistoryAdd},
+    {"history clear", "forget which files were used",                          Needs::Settings, SetUpHistoryClear},
     {"doctor",  "tell where things are, what is missing and why",               Needs::Formats,  SetUpDoctor},
     {"completion", "print a script that completes command lines in a shell",   Needs::Nothing,  SetUpCompletion},
 };

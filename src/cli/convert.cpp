@@ -11,6 +11,7 @@
 #include "cli/overwrite_question.h"
 #include "cli/picture_failure.h"
 #include "cli/result_output.h"
+#include "cli/used_files.h"
 #include "core/nearest_name.h"
 #include "core/plain_name.h"
 #include "core/settings.h"
@@ -137,6 +138,7 @@ class Conversion {
                    " exists.");
     } else {
       output_.CountFile();
+      if (!options_.dryRun) used_.Add(file.name);
       if (!output_.IsJson()) {
         output_.Line(output_.Shown(file.name) + " -> " + output_.Shown(outcome.destination));
       }
@@ -286,6 +288,7 @@ class Conversion {
   OutputNames names_;
   ResultOutput output_;
   Overwrite policy_;
+  UsedFiles used_{FileFunction::Convert};
 };
 
 // What is wrong with the options, as a sentence; empty when nothing is. Fills `target`.

@@ -7,6 +7,7 @@
 #include "cli/file_selection.h"
 #include "cli/picture_failure.h"
 #include "cli/result_output.h"
+#include "cli/used_files.h"
 #include "core/shown_text.h"
 #include "core/text.h"
 #include "picture/registry.h"
@@ -80,7 +81,7 @@ Status GatherFacts(const SelectedFile& file, PicturePointer& picture) {
   return Status::Ok;
 }
 
-void ReportFile(const SelectedFile& file, ResultOutput& output) {
+void ReportFile(const SelectedFile& file, ResultOutput& output, UsedFiles& used) {
   PicturePointer picture;
   const Status status = GatherFacts(file, picture);
   const std::string hint = status == Status::Ok || !file.hint.empty() ? file.hint : OpenHint(file.name, status);
@@ -101,6 +102,7 @@ void ReportFile(const SelectedFile& file, ResultOutput& output) {
     return;
   }
   output.CountFile();
+  used.Add(file.name);
   if (!output.IsJson()) PrintFacts(output, file.name, *picture);
 }
 
@@ -108,9 +110,10 @@ int RunInfo(const InfoOptions& options, const CommandContext& context) {
   const auto files = SelectFiles(options.selection, context);
   if (!files) return kExitUsage;
   ResultOutput output(context, options.json);
+  UsedFiles used(FileFunction::GetInfo);
   for (const SelectedFile& file : *files) {
     if (!output.GoesOn()) break;
-    ReportFile(file, output);
+    ReportFile(file, output, used);
   }
   return output.Finish();
 }

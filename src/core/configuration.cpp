@@ -171,6 +171,8 @@ SaveResult RemoveSetting(const KeyRow& row) {
   return result;
 }
 
+bool IsForThisRun(const KeyRow& row) { return TheConfiguration().forThisRun[NumberOfKey(row)]; }
+
 void KeepSetting(const KeyRow& row) { TheConfiguration().forThisRun.reset(NumberOfKey(row)); }
 
 EarlySettings ReadEarlySettings() {

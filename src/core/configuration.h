@@ -72,6 +72,8 @@ SaveResult SaveConfiguration();
 SaveResult StoreSetting(const KeyRow& row, const SettingValue& value);
 // Takes a key out of the configuration file and gives it its default.
 SaveResult RemoveSetting(const KeyRow& row);
+// Whether a key has its value from SetSetting.
+bool IsForThisRun(const KeyRow& row);
 // From here on a value given by SetSetting counts like one that the user chose in a dialog, and is saved.
 void KeepSetting(const KeyRow& row);
 

@@ -1,0 +1,30 @@
+#pragma once
+
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "catalog/file_history.h"
+
+namespace fotomill::cli {
+
+// What a command did to files, gathered while it runs and recorded in the file history when it ends. A history that
+// cannot be written is no failure of the command.
+class UsedFiles {
+ public:
+  explicit UsedFiles(FileFunction function) : function_(function) {}
+  UsedFiles(const UsedFiles&) = delete;
+  UsedFiles& operator=(const UsedFiles&) = delete;
+  ~UsedFiles() {
+    if (!uses_.empty()) (void)UpdateFileHistory(uses_);
+  }
+
+  // The command has just dealt with that file.
+  void Add(const std::string& name);
+
+ private:
+  FileFunction function_;
+  std::vector<FileUse> uses_;
+};
+
+}  // namespace fotomill::cli

@@ -1,0 +1,309 @@
+#include "catalog/file_history.h"
+
+#include <gmock/gmock.h>
+#include <signal.h>
+#include <sys/resource.h>
+
+#include "core/choice_lists.h"
+#include "core/data_folder.h"
+#include "platform/clock.h"
+#include "support/child.h"
+#include "support/faults.h"
+#include "support/files.h"
+#include "support/hex.h"
+#include "support/scoped_settings.h"
+
+namespace fotomill::test {
+namespace {
+
+using testing::ElementsAre;
+using testing::IsEmpty;
+
+constexpr int64_t kNow = 1'700'000'000;
+
+// A data folder of its own and files to record, each as long as its number.
+class FileHistory : public testing::Test {
+ protected:
+  FileHistory() {
+    SetDataFolder(folder_.Path("data"));
+    std::filesystem::create_directory(folder_.Path("data"));
+    platform::FixNow(kNow);
+    ClearFileHistory();
+  }
+  ~FileHistory() override {
+    ClearFileHistory();
+    platform::FixNow(-1);
+    SetDataFolder({});
+  }
+  std::string File(const std::string& name, size_t size = 1) const {
+    const std::string path = folder_.Path(name);
+    std::filesystem::create_directories(std::filesystem::path(path).parent_path());
+    WriteText(path, std::string(size, 'x'));
+    return path;
+  }
+  std::string Store() const { return folder_.Path("data/FMWFileHistoryDatabase.fhdb"); }
+  std::string Line(const std::string& name, const std::string& rest) const { return "\tPATH:" + folder_.Path(name) + rest + "\n"; }
+  // "NAME FUNCTION ACCESSED" of each entry in list order, with the times before now.
+  std::vector<std::string> List() const {
+    std::vector<std::string> list;
+    for (size_t i = 0; i < FileHistoryCount(); ++i) {
+      const FileHistoryEntry entry = FileHistoryAt(i);
+      list.push_back(std::string(entry.path.substr(folder_.Path().size() + 1)) + " " + std::to_string(entry.function) + " " +
+                     std::to_string(entry.accessed - kNow));
+    }
+    return list;
+  }
+  std::vector<std::string> Stored() const {
+    ClearFileHistory();
+    LoadFileHistory();
+    return List();
+  }
+
+  ScopedSettings keep_;
+  TemporaryFolder folder_;
+};
+
+bool Record(const std::string& path, int function, int64_t before, int32_t created = kOwnTime) {
+  return RecordFileHistory(path, static_cast<FileFunction>(function), created, static_cast<int32_t>(kNow - before));
+}
+
+TEST_F(FileHistory, RefreshesAnEntryAndKeepsItsSizeAndBirth) {
+  const std::string a = File("a", 3);
+  EXPECT_TRUE(Record(a, 9, 50, 1234));
+  WriteText(a, "longer than before");
+  EXPECT_TRUE(RecordFileHistory(a, FileFunction::View));
+  EXPECT_THAT(List(), ElementsAre("a 0 0"));
+  EXPECT_EQ(FileHistoryAt(0).size, 3u);
+  EXPECT_EQ(FileHistoryAt(0).created, 1234);
+}
+
+TEST_F(FileHistory, SortsByTimeThenBackwardsByNameThenPath) {
+  for (const char* name : {"x/b.bmp", "b.jpg", "x/c.bmp", "b.bmp", "y/b.bmp", "a"}) EXPECT_TRUE(Record(File(name), 0, 5));
+  EXPECT_TRUE(Record(File("late"), 0, 4));
+  EXPECT_TRUE(Record(File("early"), 0, 6));
+  EXPECT_TRUE(Record(folder_.Path("a"), 0, 3));
+  EXPECT_THAT(List(), ElementsAre("a 0 -3", "late 0 -4", "x/c.bmp 0 -5", "b.jpg 0 -5", "y/b.bmp 0 -5", "x/b.bmp 0 -5",
+                                  "b.bmp 0 -5", "early 0 -6"));
+  EXPECT_TRUE(RemoveFromFileHistory(folder_.Path("b.jpg")));
+  EXPECT_FALSE(RemoveFromFileHistory(folder_.Path("b.jpg")));
+  EXPECT_EQ(List().size(), 7u);
+}
+
+TEST_F(FileHistory, IsLimitedByCountOrByDays) {
+  for (int i = 0; i < 25; ++i) EXPECT_TRUE(Record(File("f" + std::to_string(i)), 0, 100 - i));
+  ASSERT_EQ(FileHistoryCount(), 20u);
+  EXPECT_EQ(List().front(), "f24 0 -76");
+  EXPECT_EQ(List().back(), "f5 0 -95");
+  settings.FileHistoryWindowCount = 3;
+  EXPECT_TRUE(Record(File("old"), 0, 1000));
+  EXPECT_THAT(List(), ElementsAre("f24 0 -76", "f23 0 -77", "f22 0 -78"));
+  settings.FileHistoryWindowType = choice::kLimitDays;
+  EXPECT_TRUE(Record(File("limit"), 0, 30 * 86400));
+  EXPECT_TRUE(Record(File("beyond"), 0, 30 * 86400 + 1));
+  EXPECT_EQ(List().back(), "limit 0 -2592000");
+  settings.FileHistoryWindowType = choice::kLimitCount;
+  settings.FileHistoryWindowCount = -1;
+  EXPECT_TRUE(Record(File("none"), 0, 0));
+  EXPECT_THAT(List(), IsEmpty());
+}
+
+TEST_F(FileHistory, RefusesWhatItCannotKeep) {
+  const std::string a = File("a");
+  std::filesystem::create_directory(folder_.Path("folder"));
+  std::string deep = folder_.Path();
+  while (deep.size() < 200) deep += "/" + std::string(std::min<size_t>(50, 261 - deep.size() - 2), 'd');
+  std::filesystem::create_directories(deep);
+  const std::string fits = deep + "/" + std::string(260 - deep.size() - 1, 'f');
+  const struct {
+    const char* name;
+    std::string path;
+    int function;
+    int32_t mask;
+    bool recorded;
+  } rows[] = {
+      {"plain", a, 0, 1, true},
+      {"masked", a, 1, 1, false},
+      {"below", a, -1, -1, false},
+      {"above", a, 20, -1, false},
+      {"missing", folder_.Path("b"), 0, 1, false},
+      {"a folder", folder_.Path("folder"), 0, 1, false},
+      {"empty", "", 0, 1, false},
+      {"260 bytes", fits, 0, 1, true},
+      {"261 bytes", fits + "f", 0, 1, false},
+      {"tab", File("a\tb"), 0, 1, false},
+      {"newline", File("a\nb"), 0, 1, false},
+      {"return", File("a\rb"), 0, 1, false},
+      {"other bytes", File("\x01 \xff\xc3\xa4:"), 0, 1, true},
+  };
+  WriteText(fits, "");
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    ClearFileHistory();
+    settings.FileHistoryFunctions = row.mask;
+    EXPECT_EQ(RecordFileHistory(row.path, static_cast<FileFunction>(row.function)), row.recorded);
+    const FileUse use{row.path, static_cast<FileFunction>(row.function)};
+    EXPECT_EQ(UpdateFileHistory({&use, 1}), HistoryUpdate::Done);
+    if (!row.recorded) continue;
+    EXPECT_TRUE(LoadFileHistory());
+    EXPECT_EQ(FileHistoryAt(0).path, row.path);
+    std::filesystem::remove(Store());
+  }
+}
+
+TEST_F(FileHistory, WritesItsLinesToTheByte) {
+  const std::string path = folder_.Path("data/a");
+  WriteText(path, "");
+  EXPECT_TRUE(Record(path, 9, 0));
+  EXPECT_TRUE(SaveFileHistory());
+  EXPECT_EQ(FileHistoryCount(), 0u);
+  std::vector<uint8_t> wanted = Hex("09 50 41 54 48 3A  # tab PATH:");
+  wanted.insert(wanted.end(), path.begin(), path.end());
+  const std::vector<uint8_t> rest = Hex(R"(09 46 55 4E 43 54 49 4F 4E 3A 39   # tab FUNCTION:9
+      09 41 43 43 45 53 53 45 44 3A 31 37 30 30 30 30 30 30 30 30         # tab ACCESSED:1700000000
+      09 45 4E 44 3A 0A                                                  # tab END: newline)");
+  wanted.insert(wanted.end(), rest.begin(), rest.end());
+  EXPECT_EQ(ReadBytes(Store()), wanted);
+}
+
+TEST_F(FileHistory, ReadsLinesAsTheyCome) {
+  File("a");
+  File("b");
+  const std::string good = Line("a", "\tFUNCTION:3\tACCESSED:1699999990\tEND:");
+  settings.FileHistoryFunctions = 0xfffff;
+  const struct {
+    const char* name;
+    std::string text;
+    std::vector<std::string> list;
+  } rows[] = {
+      {"good", good, {"a 3 -10"}},
+      {"blanks before", " \x01\x1f" + good, {"a 3 -10"}},
+      {"a letter before", "x" + good + Line("b", "\tFUNCTION:0"), {"b 0 0"}},
+      {"no time", Line("a", "\tFUNCTION:3"), {"a 3 0"}},
+      {"no function", Line("a", "\tACCESSED:5") + good, {"a 3 -10"}},
+      {"function too large", Line("a", "\tFUNCTION:25\tACCESSED:5"), {}},
+      {"function huge", Line("a", "\tFUNCTION:4294967296\tACCESSED:5"), {}},
+      {"order turned round", "\tACCESSED:1699999999\tFUNCTION:19" + Line("a", "\tEND:"), {"a 19 -1"}},
+      {"cut at a return", Line("a", "\tFUNCTION:3\r\tACCESSED:5"), {"a 3 0"}},
+      {"lines of DOS", good.substr(0, good.size() - 1) + "\r\n" + Line("b", "\tFUNCTION:4"), {"b 4 0", "a 3 -10"}},
+      {"no end of line", good.substr(0, good.size() - 6), {"a 3 -10"}},
+      {"file is gone", Line("c", "\tFUNCTION:3"), {}},
+      {"empty path", "\tPATH:\tFUNCTION:3\n" + good, {"a 3 -10"}},
+      {"path too long", "\tPATH:/" + std::string(300, 'x') + "\tFUNCTION:3\n" + good, {"a 3 -10"}},
+      {"a line over two reads", std::string(4095, 'x') + good, {"a 3 -10"}},
+      {"zeros", std::string(3, '\0') + good + good, {"a 3 -10"}},
+      {"same path twice", good + Line("a", "\tFUNCTION:4\tACCESSED:1699999000"), {"a 4 -1000"}},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    WriteText(Store(), row.text);
+    EXPECT_EQ(Stored(), row.list);
+  }
+}
+
+TEST_F(FileHistory, LeavesAloneWhatItCannotRead) {
+  const FileUse use{File("a"), FileFunction::View};
+  EXPECT_EQ(UpdateFileHistory({&use, 1}), HistoryUpdate::Done);
+  for (const std::string text : {"a letter to my aunt\n", "\x89PNG\r\n"}) {
+    WriteText(Store(), text);
+    EXPECT_FALSE(LoadFileHistory());
+    EXPECT_EQ(UpdateFileHistory({&use, 1}), HistoryUpdate::NotRead);
+    EXPECT_EQ(ReadText(Store()), text);
+  }
+  std::filesystem::resize_file(Store(), (16u << 20) + 1);
+  EXPECT_EQ(UpdateFileHistory({&use, 1}), HistoryUpdate::NotRead);
+  EXPECT_EQ(std::filesystem::file_size(Store()), (16u << 20) + 1);
+  EXPECT_FALSE(SaveFileHistory()) << "nothing was loaded";
+  EXPECT_TRUE(std::filesystem::exists(Store()));
+  settings.FileHistoryDatabase = SettingName("../elsewhere");
+  EXPECT_EQ(UpdateFileHistory({&use, 1}), HistoryUpdate::Failed);
+}
+
+TEST_F(FileHistory, SwitchedOffIsDeletedAtTheNextSave) {
+  const FileUse use{File("a"), FileFunction::View};
+  EXPECT_EQ(UpdateFileHistory({&use, 1}), HistoryUpdate::Done);
+  settings.FileHistoryEnable = 0;
+  EXPECT_FALSE(LoadFileHistory());
+  EXPECT_TRUE(std::filesystem::exists(Store()));
+  EXPECT_TRUE(SaveFileHistory());
+  EXPECT_FALSE(std::filesystem::exists(Store()));
+}
+
+// The list grows to 128 x 128 slots and more, of which only those with entries may cost memory.
+TEST_F(FileHistory, GrowsWithoutTouchingWhatItReserves) {
+  settings.FileHistoryWindowType = choice::kLimitDays;
+  const std::string file = File("a");
+  int64_t recorded = 0;
+  struct rusage before, after;
+  getrusage(RUSAGE_SELF, &before);
+  for (int i = 0; i < 300; ++i) {
+    const std::string link = folder_.Path("l" + std::to_string(i));
+    std::filesystem::create_hard_link(file, link);
+    recorded += Record(link, 0, (i * 7) % 300);
+  }
+  getrusage(RUSAGE_SELF, &after);
+  EXPECT_EQ(recorded, 300);
+  ASSERT_EQ(FileHistoryCount(), 300u);
+  for (size_t i = 1; i < 300; ++i) EXPECT_GE(FileHistoryAt(i - 1).accessed, FileHistoryAt(i).accessed);
+  EXPECT_LT(after.ru_maxrss - before.ru_maxrss, 32 * 1024) << "kilobytes";
+}
+
+TEST_F(FileHistory, FaultsLoseNothingThatWasThere) {
+  const FileUse first{File("a"), FileFunction::View, kOwnTime, static_cast<int32_t>(kNow - 9)};
+  EXPECT_EQ(UpdateFileHistory({&first, 1}), HistoryUpdate::Done);
+  const std::string old = ReadText(Store());
+  const FileUse second{File("b"), FileFunction::Convert};
+  const int64_t faults = ForEachFault([&] {
+    WriteText(Store(), old);
+    size_t recorded = 0;
+    const HistoryUpdate result = UpdateFileHistory({&second, 1}, &recorded);
+    const int64_t left = platform::faultCountdown.exchange(0);
+    const std::vector<std::string> stored = Stored();
+    if (result == HistoryUpdate::Done && recorded == 1) {
+      EXPECT_THAT(stored, ElementsAre("b 9 0", "a 0 -9"));
+    } else {
+      EXPECT_EQ(ReadText(Store()), old);
+    }
+    platform::faultCountdown = left;
+  });
+  EXPECT_GT(faults, 3);
+}
+
+TEST_F(FileHistory, TwoProcessesKeepEachOthersEntries) {
+  settings.FileHistoryWindowCount = 1000;
+  std::vector<std::string> files;
+  for (int i = 0; i < 40; ++i) files.push_back(File("f" + std::to_string(i)));
+  const auto recordHalf = [&](size_t from) {
+    for (size_t i = from; i < files.size(); i += 2) {
+      const FileUse use{files[i], FileFunction::View};
+      if (UpdateFileHistory({&use, 1}) != HistoryUpdate::Done) _exit(1);
+    }
+  };
+  const pid_t child = fork();
+  if (child == 0) {
+    recordHalf(0);
+    _exit(0);
+  }
+  recordHalf(1);
+  int status = -1;
+  waitpid(child, &status, 0);
+  EXPECT_EQ(status, 0);
+  EXPECT_EQ(Stored().size(), files.size());
+}
+
+TEST_F(FileHistory, AFullDiskLeavesTheOldFile) {
+  const FileUse first{File("a"), FileFunction::View};
+  EXPECT_EQ(UpdateFileHistory({&first, 1}), HistoryUpdate::Done);
+  const std::string old = ReadText(Store());
+  const FileUse second{File("b"), FileFunction::Convert};
+  const int status = InChild([&] {
+    signal(SIGXFSZ, SIG_IGN);
+    const rlimit limit{10, 10};
+    setrlimit(RLIMIT_FSIZE, &limit);
+    _exit(UpdateFileHistory({&second, 1}) == HistoryUpdate::Failed ? 0 : 1);
+  });
+  EXPECT_EQ(status, 0);
+  EXPECT_EQ(ReadText(Store()), old);
+}
+
+}  // namespace
+}  // namespace fotomill::test
