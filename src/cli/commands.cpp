@@ -10,6 +10,7 @@
 #include "cli/info.h"
 #include "cli/match.h"
 #include "cli/plugins.h"
+#include "cli/thumbs.h"
 #include "cli/verify.h"
 
 namespace fotomill::cli {
@@ -30,6 +31,10 @@ constexpr Command kCommands[] = {
     {"config set",   "give a key a value",                                     Needs::Settings, SetUpConfigSet},
     {"config unset", "give a key its default again",                           Needs::Settings, SetUpConfigUnset},
     {"config path",  "print where the configuration file is",                  Needs::Settings, SetUpConfigPath},
+    {"thumbs make",  "make the thumbnail files of pictures",                   Needs::Formats,  SetUpThumbsMake},
+    {"thumbs show",  "write a thumbnail as a picture",                         Needs::Formats,  SetUpThumbsShow},
+    {"thumbs list",  "tell which pictures of a folder have thumbnails",        Needs::Formats,  SetUpThumbsList},
+    {"thumbs clean", "delete thumbnail files whose pictures are gone",         Needs::Formats,  SetUpThumbsClean},
     {"history list",  "list the files used last, and what for",               Needs::Settings, SetUpHistoryList},
     {"history add",   "record in the file history that a file was used",       Needs::Settings, SetUpHistoryAdd},
     {"history clear", "forget which files were used",                          Needs::Settings, SetUpHistoryClear},

@@ -1,0 +1,303 @@
+#include "cli/thumbs.h"
+
+#include <CLI/CLI.hpp>
+#include <algorithm>
+#include <atomic>
+#include <condition_variable>
+#include <map>
+#include <memory>
+#include <mutex>
+#include <string>
+#include <thread>
+#include <vector>
+
+#include "catalog/thumbnail_file.h"
+#include "cli/file_selection.h"
+#include "cli/option_checks.h"
+#include "cli/picture_failure.h"
+#include "cli/result_output.h"
+#include "core/settings.h"
+#include "picture/registry.h"
+#include "platform/files.h"
+#include "platform/paths.h"
+#include "platform/process.h"
+#include "platform/volumes.h"
+
+namespace fotomill::cli {
+
+namespace {
+
+struct ThumbsOptions {
+  SelectionOptions selection;
+  std::string out;
+  std::string overwrite = "refuse";
+  uint32_t jobs = 0;
+  bool force = false;
+  bool dryRun = false;
+  bool json = false;
+};
+
+// What a picture's thumbnail file is worth.
+enum class ThumbnailState { Current, Stale, Missing, Broken };
+
+ThumbnailState StateOf(const std::string& picture) {
+  const std::string path = ThumbnailPathFor(picture);
+  const platform::FileFacts facts = platform::FactsOf(path);
+  if (facts.kind == platform::FileKind::Missing) return ThumbnailState::Missing;
+  ThumbnailRecord record;
+  if (!ReadThumbnailFile(record, path)) return ThumbnailState::Broken;
+  return facts.modified < platform::FactsOf(picture).modified ? ThumbnailState::Stale : ThumbnailState::Current;
+}
+
+const char* NameOf(ThumbnailState state) {
+  switch (state) {
+    case ThumbnailState::Current: return "current";
+    case ThumbnailState::Stale: return "stale";
+    case ThumbnailState::Missing: return "missing";
+    case ThumbnailState::Broken: break;
+  }
+  return "broken";
+}
+
+Status MakeThumbnail(const std::string& name) {
+  PicturePointer picture;
+  RETURN_IF_BAD(LoadPictureInfo(name.c_str(), picture));
+  // The quick scaler's result depends on the size that it starts from.
+  if (settings.ThumbnailQuickResize == 0) picture->thumbnailSide = kSmallThumbnailSide;
+  RETURN_IF_BAD(ReadPicture(*picture));
+  ThumbnailRecord record;
+  if (picture->image.Empty()) return Status::EmptyImage;
+  if (!MakeThumbnailRecord(record, *picture)) return Status::MemoryAllocationError;
+  return WriteThumbnailFile(record, ThumbnailPathFor(name)) ? Status::Ok : Status::ErrorCreatingFile;
+}
+
+// Makes thumbnails on several threads; what is printed, and which of two pictures that share a thumbnail file has it in
+// the end, is as if they were made one after the other.
+class ThumbnailRun {
+ public:
+  ThumbnailRun(const std::vector<SelectedFile>& files, const std::vector<bool>& wanted) : outcomes_(files.size()), files_(files) {
+    std::map<std::string, size_t> groups;
+    for (size_t i = 0; i < files.size(); ++i) {
+      if (!wanted[i]) continue;
+      const auto [found, added] = groups.try_emplace(ThumbnailPathFor(files[i].name), groups_.size());
+      if (added) groups_.emplace_back();
+      groups_[found->second].push_back(i);
+    }
+  }
+  ~ThumbnailRun() {
+    stop_ = true;
+    for (std::thread& worker : workers_) worker.join();
+  }
+  ThumbnailRun(const ThumbnailRun&) = delete;
+  ThumbnailRun& operator=(const ThumbnailRun&) = delete;
+
+  void Start(unsigned jobs) {
+    const size_t count = std::min<size_t>(jobs == 0 ? platform::CoreCount() : jobs, groups_.size());
+    for (size_t i = 0; i < count; ++i) workers_.emplace_back([this] { Work(); });
+  }
+
+  // Waits for the outcome of a wanted file. False when the run was ended before.
+  bool Wait(size_t index, Status& status) {
+    std::unique_lock lock(mutex_);
+    while (!outcomes_[index].done) {
+      if (platform::PendingExit() != 0) return false;
+      finished_.wait_for(lock, std::chrono::milliseconds(100));
+    }
+    status = outcomes_[index].status;
+    return true;
+  }
+
+ private:
+  struct Outcome {
+    bool done = false;
+    Status status = Status::Ok;
+  };
+
+  void Work() {
+    while (!stop_ && platform::PendingExit() == 0) {
+      const size_t group = next_++;
+      if (group >= groups_.size()) return;
+      for (const size_t index : groups_[group]) {
+        const Status status = MakeThumbnail(files_[index].name);
+        const std::lock_guard lock(mutex_);
+        outcomes_[index] = {true, status};
+        finished_.notify_one();
+      }
+    }
+  }
+
+  std::vector<std::vector<size_t>> groups_;  // files that share a thumbnail file, in order
+  std::vector<Outcome> outcomes_;
+  const std::vector<SelectedFile>& files_;
+  std::atomic<size_t> next_{0};
+  std::atomic<bool> stop_{false};
+  std::mutex mutex_;
+  std::condition_variable finished_;
+  std::vector<std::thread> workers_;
+};
+
+int RunMake(const ThumbsOptions& options, const CommandContext& context) {
+  const auto files = SelectFiles(options.selection, context);
+  if (!files) return kExitUsage;
+  std::vector<bool> wanted;
+  for (const SelectedFile& file : *files) {
+    wanted.push_back(file.status == Status::Ok && (options.force || StateOf(file.name) != ThumbnailState::Current));
+  }
+  ResultOutput output(context, false);
+  ThumbnailRun run(*files, wanted);
+  if (!options.dryRun) run.Start(options.jobs);
+  for (size_t i = 0; i < files->size() && output.GoesOn(); ++i) {
+    const SelectedFile& file = (*files)[i];
+    Status status = file.status;
+    if (status == Status::Ok && !wanted[i]) {
+      output.Note(output.ShownMessage(file.name) + ": has a thumbnail.");
+      continue;
+    }
+    if (status == Status::Ok && !options.dryRun && !run.Wait(i, status)) break;
+    if (status != Status::Ok) {
+      output.Failure(file.name, status, file.hint.empty() ? OpenHint(file.name, status) : file.hint);
+      continue;
+    }
+    output.CountFile();
+    output.Line(output.Shown(file.name) + " -> " + output.Shown(ThumbnailPathFor(file.name)));
+  }
+  return output.Finish();
+}
+
+int RunShow(const ThumbsOptions& options, const CommandContext& context) {
+  const std::string& name = context.names.values[0];
+  ResultOutput output(context, false);
+  const auto fail = [&](const std::string& file, Status status, std::string_view hint) {
+    output.Failure(file, status, hint);
+    return output.Finish();
+  };
+  if (!platform::IsRegularFile(name)) return fail(name, Status::FileOpenError, {});
+  ThumbnailRecord record;
+  if (!ReadThumbnailFile(record, name)) return fail(name, Status::DamagedFile, "It is no thumbnail file.");
+  const PicturePointer picture = NewPictureRecord();
+  if (picture == nullptr) return fail(name, Status::MemoryAllocationError, {});
+  if (const Status status = ThumbnailRecordToBitmap(record, picture->image); status != Status::Ok) return fail(name, status, {});
+  picture->width = picture->image.Width();
+  picture->height = picture->image.Height();
+  picture->bitsPerPixel = picture->image.Bits();
+  WriteOptions write;
+  write.existing = options.overwrite == "replace" ? platform::Existing::Replace : platform::Existing::Refuse;
+  const Status status = WritePicture(*picture, options.out, write);
+  if (status != Status::Ok) {
+    const bool taken = write.existing == platform::Existing::Refuse && platform::FileExists(options.out);
+    return fail(options.out, status, taken ? "The file is there; --overwrite replace replaces it." : "");
+  }
+  output.CountFile();
+  output.Line(output.Shown(name) + " -> " + output.Shown(options.out));
+  return output.Finish();
+}
+
+// The pictures of a folder, or a failure of the whole command.
+std::optional<std::vector<std::string>> PicturesIn(const std::string& folder) {
+  const auto entries = platform::ListFolder(folder);
+  if (!entries) return std::nullopt;
+  std::vector<std::string> pictures;
+  for (const platform::FolderEntry& entry : *entries) {
+    const bool picture = entry.kind == platform::FileKind::Regular && FindFormatByName(entry.name) != kNoFormat;
+    if (picture) pictures.push_back(platform::JoinFolder(folder, entry.name));
+  }
+  return pictures;
+}
+
+int FailFolder(ResultOutput& output, const std::string& folder) {
+  output.Failure(folder, Status::FileOpenError, platform::FileExists(folder) ? "It is no folder that can be read." : "");
+  return output.Finish();
+}
+
+int RunList(const ThumbsOptions& options, const CommandContext& context) {
+  const std::string& folder = context.names.values[0];
+  ResultOutput output(context, options.json);
+  const auto pictures = PicturesIn(folder);
+  const auto orphans = pictures ? OrphanThumbnails(folder, *pictures) : std::nullopt;
+  if (!orphans) return FailFolder(output, folder);
+  const auto print = [&](const std::string& file, const std::string& thumbnail, const char* state) {
+    if (!output.IsJson()) return output.Line(std::string(state) + "\t" + output.Shown(file.empty() ? thumbnail : file));
+    Json element;
+    PutName(element, "file", file);
+    PutName(element, "thumbnail", thumbnail);
+    element["status"] = state;
+    output.Element(element);
+  };
+  for (const std::string& picture : *pictures) {
+    if (!output.GoesOn()) break;
+    print(picture, ThumbnailPathFor(picture), NameOf(StateOf(picture)));
+  }
+  for (const std::string& orphan : *orphans) print({}, orphan, "orphan");
+  return kExitOk;
+}
+
+int RunClean(const ThumbsOptions& options, const CommandContext& context) {
+  const std::string& folder = context.names.values[0];
+  ResultOutput output(context, false);
+  const auto pictures = PicturesIn(folder);
+  const auto orphans = pictures ? OrphanThumbnails(folder, *pictures) : std::nullopt;
+  if (!orphans) return FailFolder(output, folder);
+  const bool optical = platform::VolumeOf(folder).kind == platform::DriveKind::Optical;
+  for (const std::string& orphan : *orphans) {
+    if (!output.GoesOn()) break;
+    if (!options.dryRun && (optical || !platform::DeleteFile(orphan))) {
+      output.Failure(orphan, Status::ErrorWritingFile, "It could not be deleted.");
+      continue;
+    }
+    output.CountFile();
+    output.Line(output.Shown(orphan));
+  }
+  return output.Finish();
+}
+
+using Run = int (*)(const ThumbsOptions& options, const CommandContext& context);
+
+std::shared_ptr<ThumbsOptions> SetUp(CLI::App& app, CommandContext& context, Run run, const char* text) {
+  auto options = std::make_shared<ThumbsOptions>();
+  app.footer(text);
+  context.run = [options, &context, run] { return run(*options, context); };
+  return options;
+}
+
+}  // namespace
+
+void SetUpThumbsMake(CLI::App& app, CommandContext& context) {
+  const auto options = SetUp(app, context, RunMake,
+                             "A picture whose thumbnail file is as new as itself is left out. Pictures that differ in their "
+                             "extension only share a thumbnail file; the last one has it.\n\n"
+                             "Example: fotomill thumbs make holiday --recursive");
+  AddSelection(app, options->selection, context);
+  app.add_flag("--force", options->force, "Make thumbnails that are there and current again");
+  app.add_option("-j,--jobs", options->jobs, "Pictures in work at once; 0, the default, is one a core")
+      ->option_text("N")
+      ->check(CLI::Range(0, 256));
+  app.add_flag("-n,--dry-run", options->dryRun, "Only print what would be made");
+}
+
+void SetUpThumbsShow(CLI::App& app, CommandContext& context) {
+  const auto options = SetUp(app, context, RunShow, "Example: fotomill thumbs show holiday/beach.THN --out beach.bmp");
+  context.names.Declare("FILE.THN", "The thumbnail file", 1, 1);
+  app.add_option("-o,--out", options->out, "The picture to write, in the format of its extension")
+      ->option_text("FILE")
+      ->required()
+      ->check(NotEmpty());
+  app.add_option("--overwrite", options->overwrite, "When FILE is there: refuse (the default) or replace")
+      ->option_text("HOW")
+      ->check(CLI::IsMember({"refuse", "replace"}));
+}
+
+void SetUpThumbsList(CLI::App& app, CommandContext& context) {
+  const auto options = SetUp(app, context, RunList,
+                             "A thumbnail is current, stale (older than its picture), missing, broken, or an orphan (there is "
+                             "no picture of its name).\n\nExample: fotomill thumbs list holiday --json");
+  context.names.Declare("DIR", "A folder of pictures", 1, 1);
+  app.add_flag("--json", options->json, "One JSON array of {file, thumbnail, status}");
+}
+
+void SetUpThumbsClean(CLI::App& app, CommandContext& context) {
+  const auto options = SetUp(app, context, RunClean, "Example: fotomill thumbs clean holiday --dry-run");
+  context.names.Declare("DIR", "A folder of pictures", 1, 1);
+  app.add_flag("-n,--dry-run", options->dryRun, "Only print what would be deleted");
+}
+
+}  // namespace fotomill::cli

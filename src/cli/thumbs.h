@@ -1,0 +1,12 @@
+#pragma once
+
+#include "cli/command.h"
+
+namespace fotomill::cli {
+
+void SetUpThumbsMake(CLI::App& app, CommandContext& context);
+void SetUpThumbsShow(CLI::App& app, CommandContext& context);
+void SetUpThumbsList(CLI::App& app, CommandContext& context);
+void SetUpThumbsClean(CLI::App& app, CommandContext& context);
+
+}  // namespace fotomill::cli
