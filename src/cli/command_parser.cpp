@@ -4,7 +4,7 @@
 #include <memory>
 #include <string_view>
 
-#include "cli/option_checks.h"
+#include "cli/options.h"
 #include "core/nearest_name.h"
 
 namespace fotomill::cli {
@@ -44,21 +44,15 @@ class HelpFormatter : public CLI::Formatter {
 
 void AddGlobalOptions(CLI::App& app, GlobalOptions& global) {
   app.option_defaults()->group(kGlobalGroup);
-  app.add_option("--data", global.dataFolder, "Folder of the configuration and the stores")
-      ->option_text("DIR")
-      ->check(NotEmpty());
-  app.add_option("--set", global.settings, "Give a configuration key a value for this run; may be repeated")
-      ->option_text("KEY=VALUE")
-      ->allow_extra_args(false);
-  app.add_flag("-q,--quiet", global.quiet, "No progress and no closing lines");
-  app.add_flag("--no-input", global.noInput, "Never ask");
-  app.add_flag("--no-plugins", global.noPlugins, "Load no plug-ins");
-  app.add_option("--progress", global.progress, "auto (on a terminal) or never")
-      ->option_text("WHEN")
-      ->check(CLI::IsMember({"auto", "never"}));
-  app.add_option("--color", global.color, "auto (on a terminal, unless NO_COLOR is set), always or never")
-      ->option_text("WHEN")
-      ->check(CLI::IsMember({"auto", "always", "never"}));
+  AddName(app, "--data", global.dataFolder, "DIR", "Folder of the configuration and the stores");
+  AddRepeatedText(app, "--set", global.settings, "KEY=VALUE",
+                  "Give a configuration key a value for this run; may be repeated");
+  AddFlag(app, "-q,--quiet", global.quiet, "No progress and no closing lines");
+  AddFlag(app, "--no-input", global.noInput, "Never ask");
+  AddFlag(app, "--no-plugins", global.noPlugins, "Load no plug-ins");
+  AddChoice(app, "--progress", global.progress, "WHEN", {"auto", "never"}, "auto (on a terminal) or never");
+  AddChoice(app, "--color", global.color, "WHEN", {"auto", "always", "never"},
+            "auto (on a terminal, unless NO_COLOR is set), always or never");
   app.set_help_flag("-h,--help", "Print this help");
 }
 

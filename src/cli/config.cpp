@@ -1,10 +1,10 @@
 #include "cli/config.h"
 
-#include <CLI/CLI.hpp>
 #include <memory>
 #include <string>
 #include <vector>
 
+#include "cli/options.h"
 #include "cli/result_output.h"
 #include "cli/shown_text.h"
 #include "core/configuration.h"
@@ -164,8 +164,8 @@ using Run = int (*)(const ConfigOptions& options, const CommandContext& context)
 std::shared_ptr<ConfigOptions> SetUp(CLI::App& app, CommandContext& context, Run run, const char* jsonHelp,
                                      const char* example) {
   auto options = std::make_shared<ConfigOptions>();
-  app.add_flag("--json", options->json, jsonHelp);
-  app.footer(std::string("Example: ") + example);
+  AddFlag(app, "--json", options->json, jsonHelp);
+  SetFooter(app, std::string("Example: ") + example);
   context.run = [options, &context, run] { return run(*options, context); };
   return options;
 }
@@ -176,7 +176,7 @@ constexpr const char* kKeyJson = "One JSON array of {name, type, value, default}
 
 void SetUpConfigList(CLI::App& app, CommandContext& context) {
   const auto options = SetUp(app, context, RunList, kKeyJson, "fotomill config list --changed");
-  app.add_flag("--changed", options->changed, "Only keys that differ from their default");
+  AddFlag(app, "--changed", options->changed, "Only keys that differ from their default");
 }
 
 void SetUpConfigGet(CLI::App& app, CommandContext& context) {
@@ -187,13 +187,13 @@ void SetUpConfigGet(CLI::App& app, CommandContext& context) {
 void SetUpConfigSet(CLI::App& app, CommandContext& context) {
   context.names.Declare("KEY VALUE", "Name of a key, and the value it has from now on", 2, 2);
   const auto options = SetUp(app, context, RunSet, kKeyJson, "fotomill config set JpegCompression 85");
-  app.add_flag("-n,--dry-run", options->dryRun, "Only print what would change");
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would change");
 }
 
 void SetUpConfigUnset(CLI::App& app, CommandContext& context) {
   context.names.Declare("KEY", "Name of the key that gets its default again", 1, 1);
   const auto options = SetUp(app, context, RunUnset, kKeyJson, "fotomill config unset JpegCompression");
-  app.add_flag("-n,--dry-run", options->dryRun, "Only print what would change");
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would change");
 }
 
 void SetUpConfigPath(CLI::App& app, CommandContext& context) {

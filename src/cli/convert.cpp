@@ -1,12 +1,11 @@
 #include "cli/convert.h"
 
-#include <CLI/CLI.hpp>
 #include <map>
 #include <memory>
 #include <string>
 
 #include "cli/file_selection.h"
-#include "cli/option_checks.h"
+#include "cli/options.h"
 #include "cli/output_names.h"
 #include "cli/overwrite_question.h"
 #include "cli/picture_failure.h"
@@ -36,7 +35,7 @@ struct ConvertOptions {
   std::string metadata = "keep";
   int32_t quality = 0;  // 1 to 100; 0: as configured
   int32_t page = 1;     // from 1
-  uint32_t jobs = 0;
+  int32_t jobs = 0;
   bool reduce = false;
   bool autoOrient = false;
   bool verbose = false;
@@ -331,41 +330,28 @@ int RunConvert(const ConvertOptions& options, const CommandContext& context) {
 void SetUpConvert(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<ConvertOptions>();
   AddSelection(app, options->selection, context);
-  app.add_option("-t,--to", options->to, "Format to convert to, by its extension")
-      ->option_text("EXT")
-      ->check(NotEmpty());
-  CLI::Option* dest = app.add_option("-d,--dest", options->dest,
-                                     "Folder of the outputs, made with its parents; else they lie beside their sources")
-                          ->option_text("DIR")
-                          ->check(NotEmpty());
-  CLI::Option* out = app.add_option("-o,--out", options->out, "Name of the output, for one picture")
-                         ->option_text("FILE")
-                         ->check(NotEmpty());
-  out->excludes(dest);
-  app.add_option("--prefix", options->prefix, "Put in front of every name")->option_text("TEXT")->excludes(out);
-  app.add_option("--overwrite", options->overwrite,
-                 "ask (the way on a terminal), replace, keep-both (elsewhere) or skip files of an output's name")
-      ->option_text("HOW")
-      ->check(CLI::IsMember({"ask", "replace", "keep-both", "skip"}));
-  app.add_flag("--keep-tree", options->keepTree, "Rebuild the folders of named folders in --dest");
-  app.add_flag("--keep-times", options->keepTimes, "Give outputs the times of their sources");
-  app.add_option("--metadata", options->metadata, "Keep or strip EXIF, XMP and colour profiles")
-      ->option_text("HOW")
-      ->check(CLI::IsMember({"keep", "strip"}));
-  app.add_flag("--auto-orient", options->autoOrient, "Turn pictures upright as their EXIF says");
-  app.add_flag("--reduce", options->reduce, "Reduce the colours of pictures that are too deep for the format");
-  app.add_option("--quality", options->quality, "Of JPEG and WebP, 1 to 100")
-      ->option_text("N")
-      ->check(CLI::Range(1, 100));
-  app.add_option("--page", options->page, "Page to take of files with several, from 1")
-      ->option_text("N")
-      ->check(CLI::Range(1, INT32_MAX));
-  app.add_option("-j,--jobs", options->jobs, "Pictures at work at a time; 0, the default, is one a core")
-      ->option_text("N");
-  app.add_flag("-n,--dry-run", options->dryRun, "Only print what would be done");
-  app.add_flag("-v,--verbose", options->verbose, "Say when a format cannot hold a picture's metadata");
-  app.add_flag("--json", options->json, "One JSON array of {file, destination, status, message}");
-  app.footer("Example: fotomill convert holiday -r --to png --dest out --keep-tree");
+  AddName(app, "-t,--to", options->to, "EXT", "Format to convert to, by its extension");
+  CLI::Option* dest = AddName(app, "-d,--dest", options->dest, "DIR",
+                              "Folder of the outputs, made with its parents; else they lie beside their sources");
+  CLI::Option* out = AddName(app, "-o,--out", options->out, "FILE", "Name of the output, for one picture");
+  Exclude(out, dest);
+  Exclude(AddText(app, "--prefix", options->prefix, "TEXT", "Put in front of every name"), out);
+  AddChoice(app, "--overwrite", options->overwrite, "HOW", {"ask", "replace", "keep-both", "skip"},
+            "ask (the way on a terminal), replace, keep-both (elsewhere) or skip files of an output's name");
+  AddFlag(app, "--keep-tree", options->keepTree, "Rebuild the folders of named folders in --dest");
+  AddFlag(app, "--keep-times", options->keepTimes, "Give outputs the times of their sources");
+  AddChoice(app, "--metadata", options->metadata, "HOW", {"keep", "strip"},
+            "Keep or strip EXIF, XMP and colour profiles");
+  AddFlag(app, "--auto-orient", options->autoOrient, "Turn pictures upright as their EXIF says");
+  AddFlag(app, "--reduce", options->reduce, "Reduce the colours of pictures that are too deep for the format");
+  AddNumber(app, "--quality", options->quality, "N", 1, 100, "Of JPEG and WebP, 1 to 100");
+  AddNumber(app, "--page", options->page, "N", 1, INT32_MAX, "Page to take of files with several, from 1");
+  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, INT32_MAX,
+            "Pictures at work at a time; 0, the default, is one a core");
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would be done");
+  AddFlag(app, "-v,--verbose", options->verbose, "Say when a format cannot hold a picture's metadata");
+  AddFlag(app, "--json", options->json, "One JSON array of {file, destination, status, message}");
+  SetFooter(app, "Example: fotomill convert holiday -r --to png --dest out --keep-tree");
   context.run = [options, &context] { return RunConvert(*options, context); };
 }
 

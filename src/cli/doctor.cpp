@@ -1,11 +1,11 @@
 #include "cli/doctor.h"
 
-#include <CLI/CLI.hpp>
 #include <algorithm>
 #include <map>
 #include <string>
 
 #include "cli/libraries.h"
+#include "cli/options.h"
 #include "cli/result_output.h"
 #include "core/configuration.h"
 #include "core/data_folder.h"
@@ -121,7 +121,7 @@ int RunDoctor(const CommandContext& context) {
 }  // namespace
 
 void SetUpDoctor(CLI::App& app, CommandContext& context) {
-  app.footer("Example: fotomill doctor");
+  SetFooter(app, "Example: fotomill doctor");
   context.run = [&context] { return RunDoctor(context); };
 }
 

@@ -1,6 +1,5 @@
 #include "cli/exif.h"
 
-#include <CLI/CLI.hpp>
 #include <charconv>
 #include <cmath>
 #include <memory>
@@ -8,6 +7,7 @@
 #include <vector>
 
 #include "cli/file_selection.h"
+#include "cli/options.h"
 #include "cli/result_output.h"
 #include "metadata/exif_source.h"
 #include "metadata/exif_text.h"
@@ -49,8 +49,8 @@ class JsonLines : public ExifSink {
 // What became of one file.
 struct Outcome {
   Status status = Status::Ok;
-  std::string hint;       // behind the message
-  std::string name;       // of the file that the message is about, the picture's own when empty
+  std::string hint;  // behind the message
+  std::string name;  // of the file that the message is about, the picture's own when empty
   bool hasExif = false;
 };
 
@@ -93,7 +93,8 @@ Outcome WalkFile(const SelectedFile& file, const ExifOptions& options, ExifSink&
 
 class ExifRun {
  public:
-  ExifRun(const ExifOptions& options, const CommandContext& context) : options_(options), output_(context, options.json) {}
+  ExifRun(const ExifOptions& options, const CommandContext& context)
+      : options_(options), output_(context, options.json) {}
 
   void ReportFiles(const std::vector<SelectedFile>& files) {
     for (const SelectedFile& file : files) {
@@ -201,18 +202,16 @@ int RunExif(const ExifOptions& options, const CommandContext& context) {
 void SetUpExif(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<ExifOptions>();
   AddSelection(app, options->selection, context);
-  app.add_flag("--json", options->json, "One JSON array, an object for each file");
-  app.add_option("--thumbnail", options->thumbnail, "Write the embedded thumbnail to this file, as it is")->option_text("OUT");
-  app.add_option("--overwrite", options->overwrite, "When OUT is there: refuse (the default) or replace")
-      ->option_text("HOW")
-      ->check(CLI::IsMember({"refuse", "replace"}));
-  app.add_option("--distance", options->distance,
-                 "Tell how far two places in decimal degrees are apart, in the unit that ExifDistinceUnits chooses")
-      ->option_text("LAT,LON LAT,LON")
-      ->expected(2);
-  app.footer(
-      "Reads JPEG, TIFF, PNG and WebP files and bare EXIF blocks; several files each have their name on a line above.\n\n"
-      "Example: fotomill exif photo.jpg --thumbnail small.jpg");
+  AddFlag(app, "--json", options->json, "One JSON array, an object for each file");
+  AddText(app, "--thumbnail", options->thumbnail, "OUT", "Write the embedded thumbnail to this file, as it is");
+  AddChoice(app, "--overwrite", options->overwrite, "HOW", {"refuse", "replace"},
+            "When OUT is there: refuse (the default) or replace");
+  AddTexts(app, "--distance", options->distance, 2, "LAT,LON LAT,LON",
+           "Tell how far two places in decimal degrees are apart, in the unit that ExifDistinceUnits chooses");
+  SetFooter(app,
+            "Reads JPEG, TIFF, PNG and WebP files and bare EXIF blocks; several files each have their name on a line "
+            "above.\n\n"
+            "Example: fotomill exif photo.jpg --thumbnail small.jpg");
   context.run = [options, &context] { return RunExif(*options, context); };
 }
 

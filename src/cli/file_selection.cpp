@@ -3,7 +3,7 @@
 #include <set>
 #include <utility>
 
-#include "cli/option_checks.h"
+#include "cli/options.h"
 #include "core/limits.h"
 #include "picture/registry.h"
 #include "platform/files.h"
@@ -96,11 +96,10 @@ class Selector {
 
 void AddSelection(CLI::App& app, SelectionOptions& options, CommandContext& context) {
   context.names.Declare("FILE...", "Pictures, and folders whose pictures are meant", 0);
-  app.add_flag("-r,--recursive", options.recursive, "Take the folders in named folders as well");
-  app.add_option("--files-from", options.filesFrom, "Take names from a file, one a line; - is the standard input")
-      ->option_text("FILE|-")
-      ->check(NotEmpty());
-  app.add_flag("-0,--null", options.zeroTerminated, "Names in that file end in a zero byte instead");
+  AddFlag(app, "-r,--recursive", options.recursive, "Take the folders in named folders as well");
+  AddName(app, "--files-from", options.filesFrom, "FILE|-",
+          "Take names from a file, one a line; - is the standard input");
+  AddFlag(app, "-0,--null", options.zeroTerminated, "Names in that file end in a zero byte instead");
 }
 
 std::optional<std::vector<SelectedFile>> SelectFiles(const SelectionOptions& options, const CommandContext& context) {

@@ -1,9 +1,9 @@
 #include "cli/formats.h"
 
-#include <CLI/CLI.hpp>
 #include <memory>
 #include <string>
 
+#include "cli/options.h"
 #include "cli/result_output.h"
 #include "core/shown_text.h"
 #include "core/text.h"
@@ -49,7 +49,8 @@ std::string RowAsText(int32_t index) {
 
 std::string PluginAsText(const PluginFormatFacts& format) {
   char front[48];
-  std::snprintf(front, sizeof front, "    %-6.6s  read  %-5s  ", format.extension.c_str(), format.canWrite ? "write" : "");
+  std::snprintf(front, sizeof front, "    %-6.6s  read  %-5s  ", format.extension.c_str(),
+                format.canWrite ? "write" : "");
   return EscapeControls(front) + EscapeControls(PluginDescription(format));
 }
 
@@ -78,13 +79,15 @@ int RunFormats(const FormatsOptions& options, const CommandContext& context) {
 
 void SetUpFormats(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<FormatsOptions>();
-  CLI::Option* json = app.add_flag("--json", options->json, "One JSON array, an object for each row");
+  CLI::Option* json = AddFlag(app, "--json", options->json, "One JSON array, an object for each row");
   CLI::Option* destinations =
-      app.add_flag("--destinations", options->destinations, "The formats offered for writing, one a line");
-  CLI::Option* filter = app.add_flag("--filter", options->filter, "The open-file filter: description, tab, patterns");
-  destinations->excludes(json)->excludes(filter);
-  filter->excludes(json);
-  app.footer(
+      AddFlag(app, "--destinations", options->destinations, "The formats offered for writing, one a line");
+  CLI::Option* filter = AddFlag(app, "--filter", options->filter, "The open-file filter: description, tab, patterns");
+  Exclude(destinations, json);
+  Exclude(destinations, filter);
+  Exclude(filter, json);
+  SetFooter(
+      app,
       "Without an option: row, extension, what this build can do, description.\n\nExample: fotomill formats --json");
   context.run = [options, &context] { return RunFormats(*options, context); };
 }

@@ -1,12 +1,11 @@
 #include "cli/history.h"
 
-#include <CLI/CLI.hpp>
 #include <memory>
 #include <string>
 #include <vector>
 
 #include "catalog/file_history.h"
-#include "cli/option_checks.h"
+#include "cli/options.h"
 #include "cli/result_output.h"
 #include "core/nearest_name.h"
 #include "core/settings.h"
@@ -111,10 +110,15 @@ int RunAdd(const HistoryOptions& options, const CommandContext& context) {
   }
   size_t recorded = 0;
   switch (UpdateFileHistory({&use, 1}, &recorded)) {
-    case HistoryUpdate::Off: output.Note("The file history is switched off."); return kExitOk;
-    case HistoryUpdate::NotRead: return Complain(context, kNotRead);
-    case HistoryUpdate::Failed: return Complain(context, kNotWritten);
-    case HistoryUpdate::Done: break;
+    case HistoryUpdate::Off:
+      output.Note("The file history is switched off.");
+      return kExitOk;
+    case HistoryUpdate::NotRead:
+      return Complain(context, kNotRead);
+    case HistoryUpdate::Failed:
+      return Complain(context, kNotWritten);
+    case HistoryUpdate::Done:
+      break;
   }
   if (recorded == 0) output.Note(line + "not recorded, FileHistoryFunctions leaves this function out.");
   return kExitOk;
@@ -135,7 +139,7 @@ using Run = int (*)(const HistoryOptions& options, const CommandContext& context
 
 std::shared_ptr<HistoryOptions> SetUp(CLI::App& app, CommandContext& context, Run run, const char* example) {
   auto options = std::make_shared<HistoryOptions>();
-  app.footer(std::string("Example: ") + example);
+  SetFooter(app, std::string("Example: ") + example);
   context.run = [options, &context, run] { return run(*options, context); };
   return options;
 }
@@ -144,26 +148,24 @@ std::shared_ptr<HistoryOptions> SetUp(CLI::App& app, CommandContext& context, Ru
 
 void SetUpHistoryList(CLI::App& app, CommandContext& context) {
   const auto options = SetUp(app, context, RunList, "fotomill history list --json");
-  app.add_flag("--json", options->json, "One JSON array of {path, function, functionName, created, accessed, size}");
+  AddFlag(app, "--json", options->json, "One JSON array of {path, function, functionName, created, accessed, size}");
 }
 
 void SetUpHistoryAdd(CLI::App& app, CommandContext& context) {
   context.names.Declare("FILE", "The picture file that was used", 1, 1);
   const auto options = SetUp(app, context, RunAdd, "fotomill history add photo.jpg --function View");
-  app.add_option("--function", options->function, "What was done: a name such as \"Get info\", or a number from 0 to 19")
-      ->option_text("NAME|N")
-      ->required()
-      ->check(NotEmpty());
-  app.add_option("--created", options->created, "When the file was made, in seconds since 1970 UTC; else its own time")
-      ->option_text("SECONDS");
-  app.add_option("--accessed", options->accessed, "When it was used, in seconds since 1970 UTC; else now")
-      ->option_text("SECONDS");
-  app.add_flag("-n,--dry-run", options->dryRun, "Only tell what would be recorded");
+  Require(AddName(app, "--function", options->function, "NAME|N",
+                  "What was done: a name such as \"Get info\", or a number from 0 to 19"));
+  AddNumber(app, "--created", options->created, "SECONDS", INT32_MIN, INT32_MAX,
+            "When the file was made, in seconds since 1970 UTC; else its own time");
+  AddNumber(app, "--accessed", options->accessed, "SECONDS", INT32_MIN, INT32_MAX,
+            "When it was used, in seconds since 1970 UTC; else now");
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only tell what would be recorded");
 }
 
 void SetUpHistoryClear(CLI::App& app, CommandContext& context) {
   const auto options = SetUp(app, context, RunClear, "fotomill history clear");
-  app.add_flag("-n,--dry-run", options->dryRun, "Only tell what would be deleted");
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only tell what would be deleted");
 }
 
 }  // namespace fotomill::cli

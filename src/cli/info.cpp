@@ -1,10 +1,10 @@
 #include "cli/info.h"
 
-#include <CLI/CLI.hpp>
 #include <memory>
 #include <string>
 
 #include "cli/file_selection.h"
+#include "cli/options.h"
 #include "cli/picture_failure.h"
 #include "cli/result_output.h"
 #include "cli/used_files.h"
@@ -123,8 +123,8 @@ int RunInfo(const InfoOptions& options, const CommandContext& context) {
 void SetUpInfo(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<InfoOptions>();
   AddSelection(app, options->selection, context);
-  app.add_flag("--json", options->json, "One JSON array, an object for each file");
-  app.footer("Example: fotomill info holiday --recursive --json");
+  AddFlag(app, "--json", options->json, "One JSON array, an object for each file");
+  SetFooter(app, "Example: fotomill info holiday --recursive --json");
   context.run = [options, &context] { return RunInfo(*options, context); };
 }
 

@@ -1,9 +1,9 @@
 #include "cli/match.h"
 
-#include <CLI/CLI.hpp>
 #include <memory>
 #include <string>
 
+#include "cli/options.h"
 #include "cli/result_output.h"
 #include "core/shown_text.h"
 #include "core/text.h"
@@ -55,8 +55,8 @@ int RunMatch(const MatchOptions& options, const CommandContext& context) {
 void SetUpMatch(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<MatchOptions>();
   context.names.Declare("NAME...", "File names; they need not exist", 1);
-  app.add_flag("--json", options->json, "One JSON array of {name, index, extension, typeName}");
-  app.footer("The exit status is 1 when a name selects no format.\n\nExample: fotomill match scan.tiff photo.jpeg");
+  AddFlag(app, "--json", options->json, "One JSON array of {name, index, extension, typeName}");
+  SetFooter(app, "The exit status is 1 when a name selects no format.\n\nExample: fotomill match scan.tiff photo.jpeg");
   context.run = [options, &context] { return RunMatch(*options, context); };
 }
 

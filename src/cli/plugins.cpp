@@ -1,8 +1,8 @@
 #include "cli/plugins.h"
 
-#include <CLI/CLI.hpp>
 #include <memory>
 
+#include "cli/options.h"
 #include "cli/result_output.h"
 #include "plugins/plugin_table.h"
 
@@ -48,9 +48,9 @@ int RunPlugins(const PluginsOptions& options, const CommandContext& context) {
 
 void SetUpPlugins(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<PluginsOptions>();
-  app.add_flag("--json", options->json,
-               "One JSON array: {path, extension, textA, textB, flags1, flags2, canRead, canWrite}");
-  app.footer("Modules lie in the folder \"plugin\" beside the program.\nExample: fotomill plugins --json");
+  AddFlag(app, "--json", options->json,
+          "One JSON array: {path, extension, textA, textB, flags1, flags2, canRead, canWrite}");
+  SetFooter(app, "Modules lie in the folder \"plugin\" beside the program.\nExample: fotomill plugins --json");
   context.run = [options, &context] { return RunPlugins(*options, context); };
 }
 

@@ -1,10 +1,10 @@
 #include "cli/verify.h"
 
-#include <CLI/CLI.hpp>
 #include <memory>
 #include <string>
 
 #include "cli/file_selection.h"
+#include "cli/options.h"
 #include "cli/picture_failure.h"
 #include "cli/result_output.h"
 #include "picture/registry.h"
@@ -64,8 +64,9 @@ int RunVerify(const VerifyOptions& options, const CommandContext& context) {
 void SetUpVerify(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<VerifyOptions>();
   AddSelection(app, options->selection, context);
-  app.add_flag("--json", options->json, "One JSON array of {file, status, message}");
-  app.footer("Every page of every file is decoded in full; nothing is written.\n\nExample: fotomill verify -r holiday");
+  AddFlag(app, "--json", options->json, "One JSON array of {file, status, message}");
+  SetFooter(app,
+            "Every page of every file is decoded in full; nothing is written.\n\nExample: fotomill verify -r holiday");
   context.run = [options, &context] { return RunVerify(*options, context); };
 }
 
