@@ -56,7 +56,17 @@ class ByteWriter {
 
   // Bytes written so far.
   uint64_t Position() const { return flushed_ + used_; }
-  // Overwrites bytes that lie before Position().
+  // These overwrite bytes that lie before Position(): what lies in the file already is changed there, the rest in the buffer.
+  void Patch(uint64_t offset, std::span<const uint8_t> bytes) {
+    for (const uint8_t& byte : bytes) {
+      if (offset < flushed_) {
+        failed_ = !file_.WriteAt(offset, {&byte, 1}) || failed_;
+      } else {
+        buffer_.Data()[offset - flushed_] = byte;
+      }
+      ++offset;
+    }
+  }
   void PatchBe32(uint64_t offset, uint32_t value) {
     const uint8_t bytes[] = {static_cast<uint8_t>(value >> 24), static_cast<uint8_t>(value >> 16),
                              static_cast<uint8_t>(value >> 8), static_cast<uint8_t>(value)};
@@ -97,17 +107,6 @@ class ByteWriter {
   void Big(uint32_t value, unsigned count) {
     uint8_t* room = Room(count);
     for (unsigned i = 0; i < count; ++i) room[i] = static_cast<uint8_t>(value >> (8 * (count - 1 - i)));
-  }
-  // What lies in the file already is changed there, the rest in the buffer.
-  void Patch(uint64_t offset, std::span<const uint8_t> bytes) {
-    for (const uint8_t& byte : bytes) {
-      if (offset < flushed_) {
-        failed_ = !file_.WriteAt(offset, {&byte, 1}) || failed_;
-      } else {
-        buffer_.Data()[offset - flushed_] = byte;
-      }
-      ++offset;
-    }
   }
   void Write(std::span<const uint8_t> bytes) {
     failed_ = !file_.Write(bytes) || failed_;

@@ -15,6 +15,7 @@
 #include "formats/pcx.h"
 #include "formats/png.h"
 #include "formats/tga.h"
+#include "formats/tiff.h"
 #include "formats/xbm.h"
 #include "platform/paths.h"
 
@@ -122,7 +123,7 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"TGA", "(TGA) Targa", 1, 24, FMT_BITMAP | FMT_ALPHA,
      nullptr, TgaInfo, TgaRead, TgaWrite},
     {"TIF", "(TIF) TIFF", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_LAYERED | FMT_ALPHA,
-     NoDetails, NoInfo, NoRead, NoWrite},
+     TiffDetails, TiffInfo, TiffRead, TiffWrite},
     {"TXT", "(TXT) Text files", 1, 24, FMT_BITMAP,
      nullptr, NoInfo, NoRead, NoWrite},
     {"WAV", "(WAV) Windows WAV", 1, 24, FMT_BITMAP | FMT_SOUND | FMT_MEDIA,

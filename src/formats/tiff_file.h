@@ -1,0 +1,68 @@
+#pragma once
+
+#include <tiffio.h>
+
+#include <cstdint>
+#include <span>
+
+#include "core/byte_writer.h"
+#include "core/status.h"
+
+namespace fotomill {
+
+// What the library says while it works on one file; nothing is printed.
+struct TiffMessages {
+  char error[160] = {};    // the first error
+  char warning[160] = {};  // the first fault in pixel data that was passed over
+  bool inPixels = false;   // pixels are being decoded: warnings count from here on
+};
+
+// A TIFF file in memory, opened for reading at its first directory. `bytes` must outlive it.
+class TiffInput {
+ public:
+  explicit TiffInput(std::span<const uint8_t> bytes) : bytes_(bytes) {}
+  ~TiffInput();
+  TiffInput(const TiffInput&) = delete;
+  TiffInput& operator=(const TiffInput&) = delete;
+
+  // Ok; FileReadError (3) when the file ends too early, DamagedFile (2) when it is none or its directory makes no sense.
+  Status Open();
+  // What a failed call of the library means, by its message.
+  Status Failure() const;
+  TIFF* Handle() const { return tiff_; }
+  TiffMessages& Messages() { return messages_; }
+  std::span<const uint8_t> Bytes() const { return bytes_; }
+
+  // The library's doors to the bytes.
+  tmsize_t Read(void* target, tmsize_t count);
+  uint64_t Seek(uint64_t offset, int from);
+
+ private:
+  std::span<const uint8_t> bytes_;
+  uint64_t position_ = 0;
+  TIFF* tiff_ = nullptr;
+  TiffMessages messages_;
+};
+
+// A TIFF file being written into `out`, which must outlive it.
+class TiffOutput {
+ public:
+  explicit TiffOutput(ByteWriter& out) : out_(out) {}
+  ~TiffOutput();
+  TiffOutput(const TiffOutput&) = delete;
+  TiffOutput& operator=(const TiffOutput&) = delete;
+
+  [[nodiscard]] bool Open();
+  TIFF* Handle() const { return tiff_; }
+
+  tmsize_t Write(const void* source, tmsize_t count);
+  uint64_t Seek(uint64_t offset, int from);
+
+ private:
+  ByteWriter& out_;
+  uint64_t position_ = 0;
+  TIFF* tiff_ = nullptr;
+  TiffMessages messages_;
+};
+
+}  // namespace fotomill
