@@ -16,6 +16,7 @@
 #include "formats/png.h"
 #include "formats/tga.h"
 #include "formats/tiff.h"
+#include "formats/webp.h"
 #include "formats/xbm.h"
 #include "platform/paths.h"
 
@@ -131,7 +132,7 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"WBMP", "(WBMP) WAP bitmap", 1, 1, FMT_BITMAP,
      nullptr, NoInfo, NoRead, NoWrite},
     {"WEBP", "(WEBP) Google WebP", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES | FMT_LAYERED | FMT_TRANSPARENT | FMT_ALPHA,
-     nullptr, NoInfo, NoRead, NoWrite},
+     nullptr, WebpInfo, WebpRead, WebpWrite},
     {"WPG", "(WPG) WordPerfect Graphics", 1, 8, FMT_BITMAP,
      nullptr, NoInfo, NoRead, NoWrite},
     {"XBM", "(XBM) XWindows bitmap", 1, 1, FMT_BITMAP,

@@ -34,7 +34,7 @@ constexpr Keeping kKeepings[] = {
     {"FIT", Keeps::Size}, {"FTS", Keeps::Size},     // grey only
     {"JPG", Keeps::Size}, {"JPEG", Keeps::Size},    // lossy
     {"JPE", Keeps::Size}, {"JFI", Keeps::Size},
-    {"JFIF", Keeps::Size},
+    {"JFIF", Keeps::Size},  {"WEBP", Keeps::Size},
 };
 // clang-format on
 
@@ -182,7 +182,9 @@ TEST(EveryCodec, KeepsAlphaThatItsRowPromises) {
     ASSERT_EQ(row.write(*picture, {}), Status::Ok);
     const PicturePointer back = NewPictureRecord();
     ASSERT_EQ(row.read(*back, path.c_str()), Status::Ok);
-    EXPECT_EQ(Difference(picture->image, back->image), "");
+    if (KeepsOf(row) == Keeps::All) {
+      EXPECT_EQ(Difference(picture->image, back->image), "");
+    }
     EXPECT_EQ(Difference(picture->alpha, back->alpha), "");
     EXPECT_EQ(back->alphaFlags & kHasAlpha, kHasAlpha);
   });

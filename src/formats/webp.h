@@ -1,0 +1,15 @@
+#pragma once
+
+#include "picture/picture_record.h"
+#include "picture/write_options.h"
+
+namespace fotomill {
+
+// WebP. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when the file ends before its pixels,
+// MemoryAllocationError (6), UnsupportedFormat (8). Of an animation, the first frame is read.
+Status WebpInfo(PictureRecord& picture, const char* fileName, uint32_t flags);
+Status WebpRead(PictureRecord& picture, const char* fileName);
+// Also UnsuitableImage (13) for sides over 16383, ErrorCreatingFile (10), ErrorWritingFile (11).
+Status WebpWrite(PictureRecord& picture, const WriteOptions& options);
+
+}  // namespace fotomill

@@ -1,0 +1,79 @@
+#include "formats/webp.h"
+
+#include <gtest/gtest.h>
+
+#include "core/settings.h"
+#include "support/codecs.h"
+#include "support/scoped_settings.h"
+
+namespace fotomill::test {
+namespace {
+
+PicturePointer TransparentPicture() {
+  PicturePointer picture = PatternPicture(33, 7, 24);
+  EXPECT_EQ(NewAlphaPlane(33, 7, picture->alpha), Status::Ok);
+  for (int32_t y = 0; y < 7; ++y) {
+    for (int32_t x = 0; x < 33; ++x) picture->alpha.Row(y)[static_cast<size_t>(x)] = static_cast<uint8_t>(x * 8 + y);
+  }
+  return picture;
+}
+
+TEST(Webp, LosslessKeepsEveryPixel) {
+  const ScopedSettings scoped;
+  settings.WebPLossless = 1;
+  const PicturePointer plain = PatternPicture(50, 40, 24), transparent = TransparentPicture();
+  for (const bool metadata : {false, true}) {  // metadata change the file's layout
+    if (metadata) plain->metadata.xmp = transparent->metadata.xmp = {'<', 'x', '>'};
+    const Decoded first = Decode(WebpRead, Encode(WebpWrite, *plain));
+    ASSERT_EQ(first.status, Status::Ok);
+    EXPECT_TRUE(SamePixels(first.picture->image, plain->image));
+    EXPECT_TRUE(first.picture->alpha.Empty());
+    const Decoded second = Decode(WebpRead, Encode(WebpWrite, *transparent));
+    ASSERT_EQ(second.status, Status::Ok);
+    EXPECT_TRUE(SamePixels(second.picture->image, transparent->image));
+    EXPECT_TRUE(SamePixels(second.picture->alpha, transparent->alpha));
+  }
+}
+
+TEST(Webp, MetadataTravels) {
+  const ScopedSettings scoped;
+  for (const bool alpha : {false, true}) {
+    const PicturePointer picture = alpha ? TransparentPicture() : PatternPicture(5, 3, 24);
+    picture->metadata.exif = {'I', 'I', 42, 0, 8, 0, 0, 0, 0, 0, 0, 0, 0, 0};
+    picture->metadata.xmp = {'<', 'x', '>'};  // of odd length
+    picture->metadata.icc.assign(131, 9);
+    settings.PreserveEXIF = 1;
+    const Decoded back = Decode(WebpRead, Encode(WebpWrite, *picture));
+    ASSERT_EQ(back.status, Status::Ok);
+    EXPECT_EQ(back.picture->metadata.exif, picture->metadata.exif);
+    EXPECT_EQ(back.picture->metadata.xmp, picture->metadata.xmp);
+    EXPECT_EQ(back.picture->metadata.icc, picture->metadata.icc);
+    EXPECT_EQ(back.picture->alpha.Empty(), !alpha);
+    settings.PreserveEXIF = 0;
+    EXPECT_TRUE(Decode(WebpRead, Encode(WebpWrite, *picture)).picture->metadata.Empty());
+  }
+}
+
+TEST(Webp, BrokenFilesFail) {
+  const std::vector<uint8_t> file = Encode(WebpWrite, *PatternPicture(40, 40, 24));
+  for (size_t length = 0; length < file.size() - 1; ++length) {  // the last byte may be padding
+    const Decoded decoded = Decode(WebpRead, std::span(file).first(length));
+    EXPECT_EQ(decoded.picture->image.Empty(), decoded.status != Status::Ok) << length;
+    if (length < file.size() / 2) {
+      EXPECT_EQ(decoded.status, Status::FileReadError) << length;
+    }
+  }
+  std::vector<uint8_t> foreign = file;
+  foreign[8] = 'X';
+  EXPECT_EQ(Decode(WebpRead, foreign).status, Status::DamagedFile);
+}
+
+TEST(Webp, SidesBeyondTheFormatAreRefused) {
+  const PicturePointer picture = PatternPicture(16384, 1, 1);
+  Status status = Status::Ok;
+  EXPECT_TRUE(Encode(WebpWrite, *picture, &status).empty());
+  EXPECT_EQ(status, Status::UnsuitableImage);
+}
+
+}  // namespace
+}  // namespace fotomill::test
