@@ -1,6 +1,5 @@
 #include "cli/thumbs.h"
 
-#include <CLI/CLI.hpp>
 #include <algorithm>
 #include <atomic>
 #include <condition_variable>
@@ -13,7 +12,7 @@
 
 #include "catalog/thumbnail_file.h"
 #include "cli/file_selection.h"
-#include "cli/option_checks.h"
+#include "cli/options.h"
 #include "cli/picture_failure.h"
 #include "cli/result_output.h"
 #include "core/settings.h"
@@ -31,7 +30,7 @@ struct ThumbsOptions {
   SelectionOptions selection;
   std::string out;
   std::string overwrite = "refuse";
-  uint32_t jobs = 0;
+  int32_t jobs = 0;
   bool force = false;
   bool dryRun = false;
   bool json = false;
@@ -254,7 +253,7 @@ using Run = int (*)(const ThumbsOptions& options, const CommandContext& context)
 
 std::shared_ptr<ThumbsOptions> SetUp(CLI::App& app, CommandContext& context, Run run, const char* text) {
   auto options = std::make_shared<ThumbsOptions>();
-  app.footer(text);
+  SetFooter(app, text);
   context.run = [options, &context, run] { return run(*options, context); };
   return options;
 }
@@ -267,23 +266,17 @@ void SetUpThumbsMake(CLI::App& app, CommandContext& context) {
                              "extension only share a thumbnail file; the last one has it.\n\n"
                              "Example: fotomill thumbs make holiday --recursive");
   AddSelection(app, options->selection, context);
-  app.add_flag("--force", options->force, "Make thumbnails that are there and current again");
-  app.add_option("-j,--jobs", options->jobs, "Pictures in work at once; 0, the default, is one a core")
-      ->option_text("N")
-      ->check(CLI::Range(0, 256));
-  app.add_flag("-n,--dry-run", options->dryRun, "Only print what would be made");
+  AddFlag(app, "--force", options->force, "Make thumbnails that are there and current again");
+  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, 256, "Pictures in work at once; 0, the default, is one a core");
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would be made");
 }
 
 void SetUpThumbsShow(CLI::App& app, CommandContext& context) {
   const auto options = SetUp(app, context, RunShow, "Example: fotomill thumbs show holiday/beach.THN --out beach.bmp");
   context.names.Declare("FILE.THN", "The thumbnail file", 1, 1);
-  app.add_option("-o,--out", options->out, "The picture to write, in the format of its extension")
-      ->option_text("FILE")
-      ->required()
-      ->check(NotEmpty());
-  app.add_option("--overwrite", options->overwrite, "When FILE is there: refuse (the default) or replace")
-      ->option_text("HOW")
-      ->check(CLI::IsMember({"refuse", "replace"}));
+  Require(AddName(app, "-o,--out", options->out, "FILE", "The picture to write, in the format of its extension"));
+  AddChoice(app, "--overwrite", options->overwrite, "HOW", {"refuse", "replace"},
+            "When FILE is there: refuse (the default) or replace");
 }
 
 void SetUpThumbsList(CLI::App& app, CommandContext& context) {
@@ -291,13 +284,13 @@ void SetUpThumbsList(CLI::App& app, CommandContext& context) {
                              "A thumbnail is current, stale (older than its picture), missing, broken, or an orphan (there is "
                              "no picture of its name).\n\nExample: fotomill thumbs list holiday --json");
   context.names.Declare("DIR", "A folder of pictures", 1, 1);
-  app.add_flag("--json", options->json, "One JSON array of {file, thumbnail, status}");
+  AddFlag(app, "--json", options->json, "One JSON array of {file, thumbnail, status}");
 }
 
 void SetUpThumbsClean(CLI::App& app, CommandContext& context) {
   const auto options = SetUp(app, context, RunClean, "Example: fotomill thumbs clean holiday --dry-run");
   context.names.Declare("DIR", "A folder of pictures", 1, 1);
-  app.add_flag("-n,--dry-run", options->dryRun, "Only print what would be deleted");
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would be deleted");
 }
 
 }  // namespace fotomill::cli
