@@ -1,11 +1,13 @@
 // The TIFF writer: one page, little-endian, in strips compressed as TiffOptions says. Palettes of 1, 4 and 8 bits keep their
 // depth (greys as grey), colours are RGB, with an alpha plane as a separate extra sample. CCITT group 4 takes black and
 // white pictures, JPEG greys of 8 bits and colours without alpha; LZW takes the rest. Resolution is the picture's, else
-// TiffResolution.
+// TiffResolution; of an EXIF block, the orientation is kept.
 #include <algorithm>
+#include <span>
 #include <string>
 #include <vector>
 
+#include "core/byte_reader.h"
 #include "core/choice_lists.h"
 #include "core/creator.h"
 #include "core/settings.h"
@@ -117,6 +119,24 @@ void SetLayout(TIFF* tiff, const PictureRecord& picture, const TiffPlan& plan) {
   TIFFSetField(tiff, TIFFTAG_ROWSPERSTRIP, static_cast<uint32_t>(std::min<uint64_t>(rows, static_cast<uint64_t>(image.Height()))));
 }
 
+// The orientation in the first directory of an EXIF block, 1 when there is none.
+uint16_t OrientationOf(std::span<const uint8_t> exif) {
+  constexpr uint16_t kOrientation = 0x0112;
+  ByteReader bytes(exif);
+  const bool big = bytes.Match("MM");
+  const auto next16 = [&] { return big ? bytes.Be16() : bytes.Le16(); };
+  bytes.Seek(4);
+  bytes.Seek(big ? bytes.Be32() : bytes.Le32());
+  for (uint32_t left = next16(); left > 0 && bytes.Ok(); --left) {
+    const uint16_t tag = next16();
+    bytes.Skip(6);
+    const uint16_t value = next16();
+    bytes.Skip(2);
+    if (tag == kOrientation && bytes.Ok() && value >= 1 && value <= 8) return value;
+  }
+  return 1;
+}
+
 void SetMetadata(TIFF* tiff, const PictureRecord& picture, bool keep) {
   const PictureMetadata& metadata = picture.metadata;
   TIFFSetField(tiff, TIFFTAG_RESOLUTIONUNIT, RESUNIT_INCH);
@@ -124,6 +144,7 @@ void SetMetadata(TIFF* tiff, const PictureRecord& picture, bool keep) {
   TIFFSetField(tiff, TIFFTAG_YRESOLUTION, metadata.dpiY > 0 ? metadata.dpiY : settings.TiffResolution);
   TIFFSetField(tiff, TIFFTAG_SOFTWARE, std::string(kCreator).c_str());
   if (!keep) return;
+  TIFFSetField(tiff, TIFFTAG_ORIENTATION, int{OrientationOf(metadata.exif)});
   const auto setBlock = [tiff](uint32_t tag, const std::vector<uint8_t>& block) {
     if (!block.empty()) TIFFSetField(tiff, tag, static_cast<uint32_t>(block.size()), block.data());
   };

@@ -123,6 +123,7 @@ TEST(Tiff, MetadataTravels) {
   picture->metadata.dpiX = 300;
   picture->metadata.dpiY = 150;
   picture->comment = {'h', 'i'};
+  picture->metadata.exif = Hex("4D4D 002A 00000008  0001  0112 0003 00000001 0006 0000  00000000");  // orientation 6
   const Decoded back = Decode(TiffRead, Encode(TiffWrite, *picture));
   ASSERT_EQ(back.status, Status::Ok);
   EXPECT_EQ(back.picture->metadata.icc, picture->metadata.icc);
@@ -130,6 +131,7 @@ TEST(Tiff, MetadataTravels) {
   EXPECT_EQ(back.picture->metadata.dpiX, 300);
   EXPECT_EQ(back.picture->metadata.dpiY, 150);
   EXPECT_EQ(back.picture->comment, picture->comment);
+  EXPECT_EQ(back.picture->metadata.exif, Hex("4949 2A00 08000000  0100  1201 0300 01000000 0600 0000  00000000"));
 
   settings.PreserveEXIF = 0;
   EXPECT_TRUE(Decode(TiffRead, Encode(TiffWrite, *picture)).picture->metadata.Empty());
