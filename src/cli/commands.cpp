@@ -10,6 +10,7 @@
 #include "cli/info.h"
 #include "cli/match.h"
 #include "cli/plugins.h"
+#include "cli/tdb.h"
 #include "cli/thumbs.h"
 #include "cli/verify.h"
 
@@ -35,6 +36,11 @@ constexpr Command kCommands[] = {
     {"thumbs show",  "write a thumbnail as a picture",                         Needs::Formats,  SetUpThumbsShow},
     {"thumbs list",  "tell which pictures of a folder have thumbnails",        Needs::Formats,  SetUpThumbsList},
     {"thumbs clean", "delete thumbnail files whose pictures are gone",         Needs::Formats,  SetUpThumbsClean},
+    {"tdb add",      "add thumbnails of pictures to a thumbnail database",     Needs::Formats,  SetUpTdbAdd},
+    {"tdb find",     "take a picture's thumbnail out of a database",           Needs::Settings, SetUpTdbFind},
+    {"tdb list",     "list the records of a thumbnail database",               Needs::Settings, SetUpTdbList},
+    {"tdb delete",   "mark a picture's thumbnails in a database deleted",      Needs::Settings, SetUpTdbDelete},
+    {"tdb compact",  "take deleted records out of a thumbnail database",       Needs::Settings, SetUpTdbCompact},
     {"history list",  "list the files used last, and what for",               Needs::Settings, SetUpHistoryList},
     {"history add",   "record in the file history that a file was used",       Needs::Settings, SetUpHistoryAdd},
     {"history clear", "forget which files were used",                          Needs::Settings, SetUpHistoryClear},

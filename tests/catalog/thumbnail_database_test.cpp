@@ -1,0 +1,406 @@
+#include "catalog/thumbnail_database.h"
+
+#include <gmock/gmock.h>
+#include <signal.h>
+#include <sys/resource.h>
+
+#include <algorithm>
+#include <nlohmann/json.hpp>
+#include <random>
+#include <thread>
+
+#include "platform/clock.h"
+#include "platform/volumes.h"
+#include "support/bitmaps.h"
+#include "support/child.h"
+#include "support/command_line.h"
+#include "support/faults.h"
+#include "support/files.h"
+#include "support/hex.h"
+
+namespace fotomill::test {
+namespace {
+
+using nlohmann::json;
+using testing::ElementsAre;
+using Opened = ThumbnailDatabase::Opened;
+using Compacted = ThumbnailDatabase::Compacted;
+
+class Database : public testing::Test {
+ protected:
+  Database() { platform::FixNow(0x65432100); }
+  ~Database() override {
+    platform::FixNow(-1);
+    platform::ReplaceVolumeFunction(nullptr);
+  }
+  std::string Path() const { return folder_.Path("Fotomill.tdb"); }
+  uint64_t Size() const { return std::filesystem::file_size(Path()); }
+  // "PATH VOLUME PIXEL", with an "x" behind what is deleted; the pixel tells thumbnails apart.
+  std::vector<std::string> Records() const {
+    ThumbnailDatabase database;
+    DatabaseHeader header;
+    std::vector<std::string> records;
+    if (database.Open(Path(), false) != Opened::Done || !database.ReadHeader(header)) return {"unreadable"};
+    for (int64_t i = 0; i < database.RecordCount(header); ++i) {
+      DatabaseRecord record;
+      if (!database.ReadRecord(i, record)) return {"broken"};
+      records.push_back(record.path + " " + record.volume + " " + std::to_string(record.thumbnail.bytes[300]) +
+                        (record.deleted ? " x" : ""));
+    }
+    return records;
+  }
+  TemporaryFolder folder_;
+};
+
+DatabaseRecord Record(const std::string& path, const std::string& volume, uint8_t pixel) {
+  DatabaseRecord record;
+  record.thumbnail.Sign();
+  record.thumbnail.bytes[300] = pixel;
+  record.path = path;
+  record.volume = volume;
+  return record;
+}
+
+bool Append(ThumbnailDatabase& database, const std::string& path, const std::string& volume, uint8_t pixel, bool replace = false) {
+  const DatabaseRecord record = Record(path, volume, pixel);
+  return database.Append({&record, 1}, replace);
+}
+
+TEST_F(Database, IsLaidOutToTheByte) {
+  ThumbnailDatabase database;
+  EXPECT_EQ(database.Open(Path(), false), Opened::Missing);
+  ASSERT_EQ(database.Open(Path(), true), Opened::Done);
+  std::vector<uint8_t> empty = Hex(R"(42 52 4E 54 54 44 42 58  # BRNTTDBX
+      00 01 60 01  00 00 00 00  00 00 00 00                    # version, count, reserved
+      00 21 43 65  00 21 43 65                                 # created, appended)");
+  empty.resize(60);
+  EXPECT_EQ(ReadBytes(Path()), empty);
+  platform::FixNow(0x65432101);
+  ASSERT_TRUE(Append(database, "/a", "PHOTOS:12345", 9));
+  const std::vector<uint8_t> bytes = ReadBytes(Path());
+  ASSERT_EQ(bytes.size(), 28502u);
+  EXPECT_EQ(bytes[12], 1);
+  EXPECT_EQ(bytes[24], 1);
+  const auto part = [&](size_t from, size_t count) { return std::string(bytes.begin() + from, bytes.begin() + from + count); };
+  EXPECT_EQ(part(60, 4), "THNL");
+  EXPECT_EQ(part(60 + 27912, 261), "/a" + std::string(259, '\0'));
+  EXPECT_EQ(part(60 + 28173, 261), "PHOTOS:12345" + std::string(249, '\0'));
+  EXPECT_EQ(part(60 + 28434, 8), std::string(8, '\0'));
+  EXPECT_EQ(database.Delete("/a"), 1);
+  EXPECT_EQ(ReadBytes(Path())[60 + 28434], 1);
+  EXPECT_EQ(database.Compact(false), Compacted::Done);
+  EXPECT_EQ(Size(), 60u);
+  EXPECT_THAT(folder_.Names(), ElementsAre("Fotomill.tdb"));
+}
+
+TEST_F(Database, NamesVolumes) {
+  static platform::Volume volume;
+  platform::ReplaceVolumeFunction([](const std::string&) { return volume; });
+  const struct {
+    bool available;
+    std::string label, key;
+  } rows[] = {
+      {false, "X", "Unknown"},
+      {true, "PHOTOS", "PHOTOS:4294967295"},
+      {true, "", ":4294967295"},
+      {true, std::string(248, 'x'), std::string(248, 'x') + ":4294967295"},
+      {true, std::string(249, 'x'), std::string(249, 'x')},
+      {true, std::string(300, 'x'), std::string(260, 'x')},
+  };
+  for (const auto& row : rows) {
+    volume = {row.available, row.label, 4294967295u, platform::DriveKind::Fixed};
+    EXPECT_EQ(VolumeKeyFor("/a"), row.key);
+  }
+}
+
+// Every lookup gives what a scan from the first record gives, whatever happened before, also through another handle.
+TEST_F(Database, FindsWhatAScanFinds) {
+  ThumbnailDatabase one, two;
+  ASSERT_EQ(one.Open(Path(), true), Opened::Done);
+  ASSERT_EQ(two.Open(Path(), false), Opened::Done);
+  struct Row {
+    std::string path, volume;
+    uint8_t pixel;
+    bool deleted = false;
+  };
+  std::vector<Row> model;
+  std::mt19937 random(7);
+  for (int step = 0; step < 400; ++step) {
+    SCOPED_TRACE(step);
+    ThumbnailDatabase& database = random() % 2 ? one : two;
+    const std::string path = "/p" + std::to_string(random() % 6), volume = "v" + std::to_string(random() % 2);
+    const auto pixel = static_cast<uint8_t>(step);
+    switch (random() % 8) {
+      case 0: {
+        int64_t count = 0;
+        for (Row& row : model) count += row.path == path && !std::exchange(row.deleted, row.deleted || row.path == path);
+        EXPECT_EQ(database.Delete(path), count);
+        break;
+      }
+      case 1:
+        if (random() % 4 == 0) {
+          ASSERT_EQ(database.Compact(false), Compacted::Done);
+          std::erase_if(model, [](const Row& row) { return row.deleted; });
+        }
+        break;
+      case 2:
+      case 3: {
+        const bool replace = random() % 2;
+        ASSERT_TRUE(Append(database, path, volume, pixel, replace));
+        for (Row& row : model) row.deleted = row.deleted || (replace && row.path == path && row.volume == volume);
+        model.push_back({path, volume, pixel});
+        break;
+      }
+      default: break;
+    }
+    // A handle on a database that was compacted through another one is opened again by its next change.
+    ThumbnailDatabase fresh;
+    ASSERT_EQ(fresh.Open(Path(), false), Opened::Done);
+    ThumbnailRecord found;
+    const auto wanted = std::ranges::find_if(
+        model, [&](const Row& row) { return !row.deleted && row.path == path && row.volume == volume; });
+    ASSERT_EQ(fresh.Find(path, volume, found), wanted != model.end());
+    if (wanted != model.end()) {
+      ASSERT_EQ(found.bytes[300], wanted->pixel);
+    }
+    ASSERT_EQ(database.Find(path, volume, found), wanted != model.end());
+    if (wanted != model.end()) {
+      ASSERT_EQ(found.bytes[300], wanted->pixel);
+    }
+  }
+}
+
+TEST_F(Database, LeavesAloneWhatItCannotRead) {
+  ThumbnailDatabase database;
+  ASSERT_EQ(database.Open(Path(), true), Opened::Done);
+  ASSERT_TRUE(Append(database, "/a", "v", 1));
+  ASSERT_TRUE(Append(database, "/b", "v", 2));
+  const std::vector<uint8_t> good = ReadBytes(Path());
+  const auto count = [&](std::vector<uint8_t> bytes, std::initializer_list<uint8_t> value) {
+    std::copy(value.begin(), value.end(), bytes.begin() + 12);
+    return bytes;
+  };
+  std::vector<uint8_t> cut(good.begin(), good.end() - 1), foreign = good, hole = good;
+  foreign[0] = 'X';
+  hole[60] = 'X';
+  const struct {
+    const char* name;
+    std::vector<uint8_t> bytes;
+    bool opens, appends;
+    Compacted compacts;
+    bool findsB;
+  } rows[] = {
+      {"good", good, true, true, Compacted::Done, true},
+      {"counts too many", count(good, {3, 0, 0, 0}), true, false, Compacted::NotRead, true},
+      {"counts very many", count(good, {255, 255, 255, 127}), true, false, Compacted::NotRead, true},
+      {"counts less than none", count(good, {255, 255, 255, 255}), true, false, Compacted::NotRead, false},
+      {"counts fewer", count(good, {1, 0, 0, 0}), true, true, Compacted::Done, false},
+      {"cut short", cut, true, false, Compacted::NotRead, false},
+      {"a record that is none", hole, true, true, Compacted::NotRead, true},
+      {"foreign", foreign, false, false, Compacted::NotRead, false},
+      {"short header", {good.begin(), good.begin() + 59}, false, false, Compacted::NotRead, false},
+      {"empty", {}, false, false, Compacted::NotRead, false},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    WriteBytes(Path(), row.bytes);
+    ThumbnailDatabase odd;
+    ASSERT_EQ(odd.Open(Path(), true), row.opens ? Opened::Done : Opened::NotRead);
+    if (row.opens) {
+      ThumbnailRecord found;
+      EXPECT_EQ(odd.Find("/b", "v", found), row.findsB);
+      EXPECT_EQ(odd.Compact(false), row.compacts);
+      if (row.compacts != Compacted::Done) {
+        EXPECT_EQ(ReadBytes(Path()), row.bytes);
+      }
+      EXPECT_EQ(Append(odd, "/c", "v", 3), row.appends);
+    }
+    if (!row.appends) {
+      EXPECT_EQ(ReadBytes(Path()), row.bytes);
+    }
+    EXPECT_THAT(folder_.Names(), ElementsAre("Fotomill.tdb"));
+  }
+}
+
+TEST_F(Database, PurgesOnlyWhereItCanTell) {
+  static platform::DriveKind kind;
+  static std::string label;
+  platform::ReplaceVolumeFunction([](const std::string&) { return platform::Volume{true, label, 1, kind}; });
+  const struct {
+    const char* name;
+    platform::DriveKind kind;
+    std::string label;
+    bool purged;
+  } rows[] = {
+      {"fixed", platform::DriveKind::Fixed, "v", true},     {"unknown", platform::DriveKind::Unknown, "v", true},
+      {"network", platform::DriveKind::Network, "v", false}, {"optical", platform::DriveKind::Optical, "v", false},
+      {"removable", platform::DriveKind::Removable, "v", false}, {"another volume", platform::DriveKind::Fixed, "w", false},
+  };
+  WriteText(folder_.Path("there"), "");
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    std::filesystem::remove(Path());
+    ThumbnailDatabase database;
+    ASSERT_EQ(database.Open(Path(), true), Opened::Done);
+    ASSERT_TRUE(Append(database, "/nowhere/at/all", "v:1", 1));
+    ASSERT_TRUE(Append(database, folder_.Path("there"), "v:1", 2));
+    kind = row.kind;
+    label = row.label;
+    ASSERT_EQ(database.Compact(true), Compacted::Done);
+    EXPECT_EQ(Records().size(), row.purged ? 1u : 2u);
+    EXPECT_EQ(Records().back(), folder_.Path("there") + " v:1 2");
+  }
+}
+
+TEST_F(Database, FaultsLoseNoRecord) {
+  ThumbnailDatabase database;
+  ASSERT_EQ(database.Open(Path(), true), Opened::Done);
+  ASSERT_TRUE(Append(database, "/a", "v", 1));
+  ASSERT_TRUE(Append(database, "/b", "v", 2));
+  ASSERT_EQ(database.Delete("/b"), 1);
+  database.Close();
+  const std::vector<uint8_t> start = ReadBytes(Path());
+  int64_t faults = ForEachFault([&] {
+    WriteBytes(Path(), start);
+    ThumbnailDatabase odd;
+    const bool added = odd.Open(Path(), true) == Opened::Done && Append(odd, "/a", "v", 3, true);
+    const int64_t left = platform::faultCountdown.exchange(0);
+    const std::vector<std::string> records = Records();
+    ASSERT_GE(records.size(), 2u);
+    if (added) {
+      EXPECT_THAT(records, ElementsAre("/a v 1 x", "/b v 2 x", "/a v 3"));
+    }
+    ThumbnailDatabase after;
+    ThumbnailRecord found;
+    EXPECT_EQ(after.Open(Path(), false), Opened::Done);
+    EXPECT_TRUE(after.Find("/a", "v", found));
+    platform::faultCountdown = left;
+  });
+  EXPECT_GT(faults, 6);
+  faults = ForEachFault([&] {
+    WriteBytes(Path(), start);
+    ThumbnailDatabase odd;
+    const bool done = odd.Open(Path(), false) == Opened::Done && odd.Compact(false) == Compacted::Done;
+    const int64_t left = platform::faultCountdown.exchange(0);
+    if (done) {
+      EXPECT_THAT(Records(), ElementsAre("/a v 1"));
+    } else if (Records().size() != 1) {
+      EXPECT_EQ(ReadBytes(Path()), start);
+    }
+    EXPECT_THAT(folder_.Names(), ElementsAre("Fotomill.tdb"));
+    platform::faultCountdown = left;
+  });
+  EXPECT_GT(faults, 6);
+}
+
+TEST_F(Database, TwoProcessesAppendAndCompact) {
+  { ASSERT_EQ(ThumbnailDatabase().Open(Path(), true), Opened::Done); }
+  constexpr int kEach = 25;
+  const auto add = [&](const std::string& name) {
+    ThumbnailDatabase database;
+    if (database.Open(Path(), true) != Opened::Done) _exit(1);
+    for (int i = 0; i < kEach; ++i) {
+      if (!Append(database, "/" + name + std::to_string(i), "v", 1)) _exit(2);
+      if (i % 10 == 9 && database.Compact(false) != Compacted::Done) _exit(3);
+    }
+  };
+  const pid_t child = fork();
+  if (child == 0) {
+    add("child");
+    _exit(0);
+  }
+  add("parent");
+  int status = -1;
+  waitpid(child, &status, 0);
+  EXPECT_EQ(status, 0);
+  EXPECT_EQ(Records().size(), 2u * kEach);
+}
+
+// Records whose append was reported are there, and the database is readable, whenever the writer is killed.
+TEST_F(Database, AKilledWriterLosesNothingReported) {
+  for (int round = 0; round < 12; ++round) {
+    int reported[2];
+    ASSERT_EQ(pipe(reported), 0);
+    const std::vector<std::string> before = Records();
+    const size_t had = before == std::vector<std::string>{"unreadable"} ? 0 : before.size();
+    const pid_t child = fork();
+    if (child == 0) {
+      ThumbnailDatabase database;
+      if (database.Open(Path(), true) != Opened::Done) _exit(1);
+      for (int i = 0;; ++i) {
+        if (!Append(database, "/" + std::to_string(round) + "-" + std::to_string(i), "v", 1)) _exit(2);
+        if (write(reported[1], "x", 1) != 1) _exit(3);
+        if (i % 5 == 4 && database.Compact(false) != Compacted::Done) _exit(4);
+      }
+    }
+    close(reported[1]);
+    std::this_thread::sleep_for(std::chrono::milliseconds(5 + 7 * round));
+    kill(child, SIGKILL);
+    int status = 0;
+    waitpid(child, &status, 0);
+    EXPECT_TRUE(WIFSIGNALED(status));
+    size_t count = 0;
+    for (char c; read(reported[0], &c, 1) == 1;) ++count;
+    close(reported[0]);
+    if (!std::filesystem::exists(Path())) continue;
+    EXPECT_GE(Records().size(), had + count);
+    ThumbnailDatabase database;
+    EXPECT_EQ(database.Open(Path(), true), Opened::Done);
+    EXPECT_EQ(database.Compact(false), Compacted::Done);
+    EXPECT_THAT(folder_.Names(), ElementsAre("Fotomill.tdb"));
+  }
+}
+
+TEST_F(Database, AFullDiskFailsAndCountsNothing) {
+  ThumbnailDatabase database;
+  ASSERT_EQ(database.Open(Path(), true), Opened::Done);
+  ASSERT_TRUE(Append(database, "/a", "v", 1));
+  const int status = InChild([&] {
+    signal(SIGXFSZ, SIG_IGN);
+    const rlimit limit{40000, 40000};
+    setrlimit(RLIMIT_FSIZE, &limit);
+    ThumbnailDatabase full;
+    _exit(full.Open(Path(), true) == Opened::Done && !Append(full, "/b", "v", 2) ? 0 : 1);
+  });
+  EXPECT_EQ(status, 0);
+  EXPECT_THAT(Records(), ElementsAre("/a v 1"));
+  EXPECT_TRUE(Append(database, "/c", "v", 3));
+  EXPECT_THAT(Records(), ElementsAre("/a v 1", "/c v 3"));
+}
+
+TEST_F(Database, CommandsDoAsTheySay) {
+  platform::FixNow(-1);
+  const auto in = [&](const char* name) { return folder_.Path(name); };
+  WriteBytes(in("a.bmp"), BitmapFile(5, 3, 24));
+  WriteBytes(in("b.bmp"), BitmapFile(3, 5, 8));
+  EXPECT_TRUE(RunCommand({"tdb", "list", Path()}).Says(Path() + ": File open error."));
+  EXPECT_FALSE(std::filesystem::exists(Path()));
+  EXPECT_EQ(RunCommand({"tdb", "add", Path()}).status, 2);
+  EXPECT_EQ(RunCommand({"tdb", "add", Path(), in("a.bmp"), in("b.bmp"), in("none.bmp")}).status, 1);
+  EXPECT_EQ(RunCommand({"tdb", "add", Path(), in("a.bmp")}).status, 0);
+  const json list = json::parse(RunCommand({"tdb", "list", Path(), "--json"}).out);
+  EXPECT_EQ(list["version"], 0x01600100);
+  EXPECT_EQ(list["count"], 3);
+  EXPECT_EQ(list["records"][0]["path"], in("a.bmp"));
+  EXPECT_EQ(list["records"][0]["deleted"], true);
+  EXPECT_EQ(list["records"][2]["deleted"], false);
+  EXPECT_EQ(RunCommand({"tdb", "find", Path(), in("a.bmp"), "--out", in("a.THN")}).status, 0);
+  EXPECT_EQ(ReadText(in("a.THN")), ReadText(Path()).substr(60 + 2 * 28442, 27912));
+  EXPECT_EQ(RunCommand({"tdb", "find", Path(), in("a.bmp"), "--out", in("a.THN")}).status, 1);
+  EXPECT_EQ(RunCommand({"tdb", "delete", Path(), in("b.bmp"), in("c.bmp")}).status, 1);
+  EXPECT_EQ(RunCommand({"tdb", "find", Path(), in("b.bmp"), "--out", in("b.THN")}).status, 1);
+  EXPECT_EQ(RunCommand({"tdb", "compact", Path(), "-n"}).out, "3 -> 1 records\n");
+  EXPECT_EQ(Size(), 60u + 3 * 28442);
+  std::filesystem::remove(in("a.bmp"));
+  EXPECT_EQ(RunCommand({"tdb", "compact", Path()}).out, "3 -> 1 records\n");
+  WriteText(in("foreign"), "foreign");
+  for (const char* command : {"add", "list", "compact"}) {
+    std::vector<std::string> words{"tdb", command, in("foreign")};
+    if (words[1] == "add") words.push_back(in("b.bmp"));
+    EXPECT_EQ(RunCommand(words).status, 1);
+    EXPECT_EQ(ReadText(in("foreign")), "foreign");
+  }
+}
+
+}  // namespace
+}  // namespace fotomill::test
