@@ -1,11 +1,13 @@
 #include <cstdio>
 
 #include "cli/command.h"
+#include "platform/memory.h"
 #include "platform/process.h"
 
 int main(int count, char** arguments) {
   using namespace fotomill;
   platform::CatchTermination();
+  platform::KeepFreedMemory();
   cli::Io io;
   io.inTerminal = platform::IsTerminal(0);
   io.outTerminal = platform::IsTerminal(1);

@@ -1,5 +1,6 @@
 #include "platform/memory.h"
 
+#include <malloc.h>
 #include <sys/mman.h>
 
 #include <algorithm>
@@ -192,6 +193,13 @@ void MemoryBlock::Free() {
   }
   data_ = nullptr;
   size_ = capacity_ = 0;
+}
+
+void KeepFreedMemory() {
+#ifdef __GLIBC__
+  mallopt(M_MMAP_THRESHOLD, 4 * static_cast<int>(kPooledFrom));
+  mallopt(M_TRIM_THRESHOLD, 16 * static_cast<int>(kPooledFrom));
+#endif
 }
 
 void TrimMemoryPool() { ShrinkPool(0); }
