@@ -55,8 +55,7 @@ std::vector<FileCase> Files() {
   const Bytes block = BigEndianBlock(), little = LittleEndianBlock();
   const Bytes far(20000, 0);      // more than the head that is read first
   const Bytes odd(3, 0), none;
-  Bytes cut = kStart + Segment(0xe1, kMark + block);
-  cut.resize(cut.size() - 10);
+  const Bytes whole = kStart + Segment(0xe1, kMark + block), cut(whole.begin(), whole.end() - 10);
   return {
       {"JPEG", kStart + Segment(0xe0, Bytes(14)) + Segment(0xe1, kMark + block) + kScan, block},
       {"JPEG with another APP1 first", kStart + Segment(0xe1, Of("http://ns.adobe.com/")) + Segment(0xe1, kMark + block), block},
