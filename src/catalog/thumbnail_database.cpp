@@ -294,6 +294,8 @@ ThumbnailDatabase::Compacted ThumbnailDatabase::CopyLiveRecords(platform::StoreF
                                                                 ProgressSink* progress) {
   const int32_t count = header.count;
   header.count = 0;
+  // The header comes first, so that what an interrupted pass leaves is known as ours by its first bytes.
+  if (!to.WriteAt(0, BytesOf(header))) return Compacted::Failed;
   std::vector<uint8_t> bytes(kDatabaseRecordSize);
   for (int32_t i = 0; i < count; ++i) {
     if (progress != nullptr) progress->Step(i, count);
