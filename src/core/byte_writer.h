@@ -12,9 +12,9 @@
 namespace fotomill {
 
 // Writes a new file front to back. Everything gathers in one buffer that goes out in whole blocks, each at a multiple
-// of the block's size: systems keep such writes in large pages, which costs a third of what ragged ones do. A failed
-// write is remembered; ask Failed() or Commit() once at the end. The file appears under its name only with a successful
-// Commit, and leaves no trace without one.
+// of the block's size, which systems take best; larger ones gain nothing, and cost much where the machine is a virtual
+// one whose large pieces of free memory belong to its host. A failed write is remembered; ask Failed() or Commit() once
+// at the end. The file appears under its name only with a successful Commit, and leaves no trace without one.
 class ByteWriter {
  public:
   // False when the file cannot be created there (then status 10).
@@ -33,7 +33,7 @@ class ByteWriter {
   }
   void Bytes(std::span<const uint8_t> bytes) {
     while (!bytes.empty()) {
-      if (used_ >= kBlock) FlushBlock();
+      while (used_ >= kBlock) FlushBlock();
       if (used_ == 0 && bytes.size() >= kBlock) {  // whole blocks need not be copied
         Write(bytes.first(kBlock));
         bytes = bytes.subspan(kBlock);
@@ -48,7 +48,7 @@ class ByteWriter {
   // Buffer space for up to `most` bytes (at most kMostReserved), to be filled by the caller, who then says with Used()
   // how many of them there are.
   uint8_t* Reserve(size_t most) {
-    if (kBufferSize - used_ < most) FlushBlock();
+    while (kBufferSize - used_ < most) FlushBlock();
     return buffer_.Data() + used_;
   }
   void Used(size_t count) { used_ += count; }
@@ -81,7 +81,7 @@ class ByteWriter {
 
   // Writes what is left and gives the file its name.
   [[nodiscard]] platform::CommitResult Commit(platform::Existing existing, bool sync = false) {
-    if (used_ > kBlock) FlushBlock();
+    while (used_ > kBlock) FlushBlock();
     if (used_ > 0) Write({buffer_.Data(), used_});
     used_ = 0;
     if (failed_) {
@@ -92,7 +92,7 @@ class ByteWriter {
   }
 
  private:
-  static constexpr size_t kBlock = 1024 * 1024;
+  static constexpr size_t kBlock = 64 * 1024;
   static constexpr size_t kBufferSize = kBlock + kMostReserved;
 
   uint8_t* Room(size_t count) {
