@@ -35,6 +35,7 @@ namespace {
 
 constexpr double kCentimetresPerInch = 2.54;
 constexpr tdir_t kMostPages = 1 << 20;
+constexpr uint32_t kMostRowSamples = 1 << 25;  // a row is held as a whole
 
 // How the rows of a page become the picture's.
 enum class TiffRows {
@@ -442,6 +443,7 @@ Status ReadThroughLibrary(TiffInput& input, const TiffLayout& layout, PictureRec
 
 Status ReadPixels(TiffInput& input, const TiffLayout& layout, PictureRecord& picture) {
   if (!FileHoldsPixels(input, layout)) return Status::FileReadError;
+  if (layout.width > kMostRowSamples / layout.samples) return Status::MemoryAllocationError;
   TiffTarget target;
   RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette, layout.bitsPerPixel, target.image));
   if (layout.alpha >= 0) RETURN_IF_BAD(NewAlphaPlane(picture.width, picture.height, target.alpha));

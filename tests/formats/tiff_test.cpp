@@ -88,6 +88,7 @@ TEST(Tiff, BrokenFilesFailWithTheirStatus) {
   cut.resize(cut.size() - 1);
   foreign[2] = 41;
   loop[kPageEnd - 4] = 8;  // the next page is the same one
+  std::vector<uint8_t> bomb = Page(4000000, 1, 8, 1, 60000, 259, 32773, pixels);  // a row of 240 GB, run-length coded
   const Row rows[] = {
       {"last pixel missing", cut, Status::FileReadError},
       {"another magic number", foreign, Status::DamagedFile},
@@ -95,6 +96,7 @@ TEST(Tiff, BrokenFilesFailWithTheirStatus) {
       {"directory beyond the end", Hex("49 49 2A 00 00 01 00 00"), Status::FileReadError},
       {"more rows than the file has", Page(60000, 60000, 8, 1, 1, 339, 1, pixels), Status::FileReadError},
       {"no width", Page(0, 8, 8, 1, 1, 339, 1, pixels), Status::DamagedFile},
+      {"a row that no memory holds", bomb, Status::MemoryAllocationError},
       {"directories in a circle", loop, Status::Ok},
   };
   for (const Row& row : rows) {
