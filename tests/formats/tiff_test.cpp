@@ -85,7 +85,7 @@ TEST(Tiff, BrokenFilesFailWithTheirStatus) {
     Status status;
   };
   std::vector<uint8_t> cut = Page(8, 8, 8, 1, 1, 339, 1, pixels), foreign = cut, loop = cut;
-  cut.resize(cut.size() - 1);
+  cut.pop_back();
   foreign[2] = 41;
   loop[kPageEnd - 4] = 8;  // the next page is the same one
   std::vector<uint8_t> bomb = Page(4000000, 1, 8, 1, 60000, 259, 32773, pixels);  // a row of 240 GB, run-length coded
