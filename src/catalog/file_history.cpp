@@ -17,8 +17,8 @@
 #include "core/text.h"
 #include "platform/clock.h"
 #include "platform/files.h"
-#include "platform/memory.h"
 #include "platform/paths.h"
+#include "platform/reserved_memory.h"
 
 namespace fotomill {
 
@@ -62,11 +62,11 @@ bool StandsBefore(const Slot& a, const Slot& b) {
   return aName != bName ? aName > bName : PathOf(a) > PathOf(b);
 }
 
-// The list. Its block holds the fixed parts of all slots in front and room for their thumbnails behind, so that of the much
+// The list. Its room holds the fixed parts of all slots in front and room for their thumbnails behind, so that of the much
 // that is reserved only what holds entries is ever touched.
 class HistoryList {
  public:
-  bool Exists() const { return !block_.Empty(); }
+  bool Exists() const { return !room_.Empty(); }
   size_t Count() const { return order_.size(); }
   const Slot& At(size_t index) const { return Slots()[order_[index]]; }
 
@@ -112,7 +112,7 @@ class HistoryList {
   void Free() { *this = HistoryList(); }
 
  private:
-  Slot* Slots() { return block_.Items<Slot>().data(); }
+  Slot* Slots() { return room_.Items<Slot>(0, used_).data(); }
   const Slot* Slots() const { return const_cast<HistoryList*>(this)->Slots(); }
 
   // Where a slot stands in the order, or would stand.
@@ -129,25 +129,23 @@ class HistoryList {
     return number;
   }
 
-  // A full list asks for a block of count x 128 slots and counts on 128 entries more. That is far more than it counts
-  // on, so where there is no memory for it, the block that is there lasts as long as it has slots.
+  // A full list asks for room for count x 128 slots and counts on 128 entries more. That is far more than it counts on, so
+  // where it cannot be had, the room that is there lasts as long as it has slots.
   bool MakeRoom() {
-    if (block_.Empty()) {
-      if (!block_.Allocate(kGrowth * kSlotBytes, platform::Fill::Unset)) return false;
+    if (room_.Empty()) {
+      if (!room_.Reserve(kGrowth * kSlotBytes)) return false;
       capacity_ = kGrowth;
     }
     if (order_.size() < capacity_) return true;
-    platform::MemoryBlock larger;
-    if (!larger.Allocate(order_.size() * kGrowth * kSlotBytes, platform::Fill::Unset)) {
-      return order_.size() < block_.Size() / kSlotBytes;
-    }
-    std::memcpy(larger.Data(), block_.Data(), used_ * sizeof(Slot));
-    block_ = std::move(larger);
+    platform::ReservedMemory larger;
+    if (!larger.Reserve(order_.size() * kGrowth * kSlotBytes)) return order_.size() < room_.Size() / kSlotBytes;
+    std::memcpy(larger.Items<Slot>(0, used_).data(), Slots(), used_ * sizeof(Slot));
+    room_ = std::move(larger);
     capacity_ += kGrowth;
     return true;
   }
 
-  platform::MemoryBlock block_;
+  platform::ReservedMemory room_;
   uint64_t capacity_ = 0;          // entries
   uint32_t used_ = 0;              // slots that ever held an entry
   std::vector<uint32_t> order_;    // slots as they stand in the list

@@ -7,6 +7,7 @@
 #include <thread>
 #include <vector>
 
+#include "platform/reserved_memory.h"
 #include "support/faults.h"
 
 namespace fotomill::platform {
@@ -94,6 +95,19 @@ TEST(MemoryBlock, ManyThreadsShareThePool) {
   }
   for (std::thread& thread : threads) thread.join();
   EXPECT_EQ(faults, 0);
+}
+
+TEST(ReservedMemory, HoldsMoreThanTheMachineAndSurvivesWhatCannotBeHad) {
+  ReservedMemory room;
+  constexpr uint64_t kSize = uint64_t{1} << 38;
+  ASSERT_TRUE(room.Reserve(kSize));
+  for (const uint64_t offset : {uint64_t{0}, kSize / 2 + 1, kSize - 8}) {
+    EXPECT_EQ(room.Items<uint8_t>(offset, 8)[7], 0);
+    room.Items<uint8_t>(offset, 8)[7] = 7;
+  }
+  EXPECT_FALSE(room.Reserve(UINT64_MAX / 4));
+  EXPECT_EQ(room.Size(), kSize);
+  EXPECT_EQ(room.Items<uint8_t>(0, 8)[7], 7);
 }
 
 #if defined(__SANITIZE_ADDRESS__)
