@@ -48,29 +48,32 @@ Json FactsAsJson(const PictureRecord& picture) {
   return facts;
 }
 
-void PrintFact(ResultOutput& output, const char* label, const std::string& value) {
-  std::string line = std::string("  ") + label;
-  output.Line(line.append(16 - line.size(), ' ') + EscapeControls(value));
+void AddFact(std::string& text, std::string_view label, std::string_view value) {
+  text.append(2, ' ').append(label).append(14 - label.size(), ' ').append(EscapeControls(value)).append(1, '\n');
 }
 
-void PrintFacts(ResultOutput& output, const std::string& name, const PictureRecord& picture) {
-  output.Line(output.Shown(name));
-  PrintFact(output, "Format", std::string(FormatRow(picture.formatIndex).description.view()));
-  if (!picture.typeName.empty()) PrintFact(output, "Type", std::string(picture.typeName.view()));
-  PrintFact(output, "Dimensions", std::to_string(picture.width) + " x " + std::to_string(picture.height) + " pixels");
+// The lines of one file as one text, which leaves in one write.
+std::string FactsAsText(const PictureRecord& picture) {
+  const FormatEntry& row = FormatRow(picture.formatIndex);
+  std::string text;
+  AddFact(text, "Format", row.description.view());
+  if (!picture.typeName.empty()) AddFact(text, "Type", picture.typeName.view());
+  AddFact(text, "Dimensions", std::to_string(picture.width) + " x " + std::to_string(picture.height) + " pixels");
   std::string depth = std::to_string(picture.bitsPerPixel) + (picture.bitsPerPixel == 1 ? " bit" : " bits");
   if ((picture.alphaFlags & kHasAlpha) != 0) depth += " and alpha";
-  PrintFact(output, "Depth", depth);
-  if (picture.pageCount > 1) PrintFact(output, "Pages", std::to_string(picture.pageCount));
+  AddFact(text, "Depth", depth);
+  if (picture.pageCount > 1) AddFact(text, "Pages", std::to_string(picture.pageCount));
   if (picture.metadata.dpiX > 0 && picture.metadata.dpiY > 0) {
-    PrintFact(output, "Resolution",
-              Resolution(picture.metadata.dpiX) + " x " + Resolution(picture.metadata.dpiY) + " pixels per inch");
+    AddFact(text, "Resolution",
+            Resolution(picture.metadata.dpiX) + " x " + Resolution(picture.metadata.dpiY) + " pixels per inch");
   }
-  PrintFact(output, "File size", WithThousands(picture.fileSize) + " bytes");
-  PrintFact(output, "Image data", WithThousands(picture.imageBytes) + " bytes");
+  AddFact(text, "File size", WithThousands(picture.fileSize) + " bytes");
+  AddFact(text, "Image data", WithThousands(picture.imageBytes) + " bytes");
   for (size_t i = 0; i < picture.detailLines.Count(); ++i) {
-    output.Line("  " + EscapeControls(picture.detailLines.Line(i)));
+    text.append(2, ' ').append(EscapeControls(picture.detailLines.Line(i))).append(1, '\n');
   }
+  text.pop_back();
+  return text;
 }
 
 Status GatherFacts(const SelectedFile& file, PicturePointer& picture) {
@@ -103,7 +106,7 @@ void ReportFile(const SelectedFile& file, ResultOutput& output, UsedFiles& used)
   }
   output.CountFile();
   used.Add(file.name);
-  if (!output.IsJson()) PrintFacts(output, file.name, *picture);
+  if (!output.IsJson()) output.Line(output.Shown(file.name) + "\n" + FactsAsText(*picture));
 }
 
 int RunInfo(const InfoOptions& options, const CommandContext& context) {

@@ -16,6 +16,7 @@ void Write(std::FILE* stream, std::string_view text) {
 // JSON text in which control characters beyond ASCII, which JSON lets stand, are escaped too: it may go to a terminal.
 std::string SafeJson(const Json& value) {
   const std::string text = value.dump(-1, ' ', false, Json::error_handler_t::replace);
+  if (text.find('\x7F') == std::string::npos && text.find('\xC2') == std::string::npos) return text;
   std::string result;
   result.reserve(text.size());
   for (size_t i = 0; i < text.size(); ++i) {

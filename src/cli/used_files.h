@@ -25,6 +25,7 @@ class UsedFiles {
  private:
   FileFunction function_;
   std::vector<FileUse> uses_;
+  std::string folder_, absoluteFolder_;  // of the last file
 };
 
 }  // namespace fotomill::cli

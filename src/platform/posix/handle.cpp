@@ -63,16 +63,11 @@ Handle OpenHandle(const char* path, int flags, mode_t mode) {
 }
 
 Handle OpenRegular(const char* path, int flags, struct stat& facts) {
-  if (stat(path, &facts) != 0) return Handle();
-  if (!S_ISREG(facts.st_mode)) {
-    errno = S_ISDIR(facts.st_mode) ? EISDIR : EINVAL;
-    return Handle();
-  }
   Handle handle = OpenHandle(path, flags | O_NONBLOCK | O_NOCTTY);
   if (!handle.IsOpen() || fstat(handle.Number(), &facts) != 0) return Handle();
   if (S_ISREG(facts.st_mode)) return handle;
   handle.Reset();
-  errno = EINVAL;
+  errno = S_ISDIR(facts.st_mode) ? EISDIR : EINVAL;
   return Handle();
 }
 
