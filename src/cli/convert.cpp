@@ -8,7 +8,7 @@
 #include "cli/options.h"
 #include "cli/output_names.h"
 #include "cli/overwrite_question.h"
-#include "cli/picture_failure.h"
+#include "batch/picture_failure.h"
 #include "cli/result_output.h"
 #include "cli/used_files.h"
 #include "core/nearest_name.h"

@@ -5,7 +5,7 @@
 
 #include "cli/file_selection.h"
 #include "cli/options.h"
-#include "cli/picture_failure.h"
+#include "batch/picture_failure.h"
 #include "cli/result_output.h"
 #include "cli/used_files.h"
 #include "core/shown_text.h"

@@ -8,7 +8,7 @@
 #include "catalog/thumbnail_file.h"
 #include "cli/file_selection.h"
 #include "cli/options.h"
-#include "cli/picture_failure.h"
+#include "batch/picture_failure.h"
 #include "cli/result_output.h"
 #include "core/settings.h"
 #include "picture/registry.h"

@@ -79,12 +79,16 @@ class ByteWriter {
   }
   bool Failed() const { return failed_; }
 
-  // Writes what is left and gives the file its name.
-  [[nodiscard]] platform::CommitResult Commit(platform::Existing existing, bool sync = false) {
+  // Writes what is left; nothing can be added then. False when any write has failed.
+  [[nodiscard]] bool WriteRest() {
     while (used_ > kBlock) FlushBlock();
     if (used_ > 0) Write({buffer_.Data(), used_});
     used_ = 0;
-    if (failed_) {
+    return !failed_;
+  }
+  // Writes what is left and gives the file its name.
+  [[nodiscard]] platform::CommitResult Commit(platform::Existing existing, bool sync = false) {
+    if (!WriteRest()) {
       file_.Discard();
       return platform::CommitResult::Failed;
     }

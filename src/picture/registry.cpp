@@ -306,6 +306,9 @@ bool KeepsMetadata(const FormatEntry& row) {
   return std::find(std::begin(kWriters), std::end(kWriters), row.write) != std::end(kWriters);
 }
 
+// None of the writers that this build has knows a protected form of its format.
+bool TakesPassword(const FormatEntry&) { return false; }
+
 void RunFormatStartup() {
   for (const FormatEntry& row : formatRows) {
     if (row.startup != nullptr) (void)row.startup();

@@ -106,6 +106,8 @@ std::string_view WhyNot(const FormatEntry& row);
 
 // Whether files of the row can hold a picture's EXIF, XMP and color profile.
 bool KeepsMetadata(const FormatEntry& row);
+// Whether the row's writer protects files by the password of its options.
+bool TakesPassword(const FormatEntry& row);
 
 // Call `startup`, or `shutdown`, of every row that has one, in row order.
 void RunFormatStartup();

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <functional>
 #include <string>
 
 #include "core/byte_writer.h"
@@ -13,6 +14,7 @@ struct WriteOptions {
   platform::Existing existing = platform::Existing::Replace;  // what to do about a file of the destination's name
   bool keepMetadata = true;  // EXIF, XMP and ICC of the record go into formats that can hold them
   std::string password;      // for formats that can be protected; empty: none
+  std::function<bool()> makeWay;  // called when the new file is whole, before it gets its name; false: it never does
 };
 
 // The status that a commit's outcome means: ErrorWritingFile when a write failed, ErrorCreatingFile when the name was taken
@@ -29,7 +31,10 @@ constexpr Status CommitStatus(platform::CommitResult result) {
   return Status::ErrorWritingFile;
 }
 
-// Commits a writer's file as the options say; statuses as above.
-inline Status CommitOutput(ByteWriter& out, const WriteOptions& options) { return CommitStatus(out.Commit(options.existing)); }
+// Commits a writer's file as the options say; statuses as above, and ErrorCreatingFile when no way was made for it.
+inline Status CommitOutput(ByteWriter& out, const WriteOptions& options) {
+  if (options.makeWay && out.WriteRest() && !options.makeWay()) return Status::ErrorCreatingFile;
+  return CommitStatus(out.Commit(options.existing));
+}
 
 }  // namespace fotomill

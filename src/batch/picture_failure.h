@@ -5,7 +5,7 @@
 
 #include "core/status.h"
 
-namespace fotomill::cli {
+namespace fotomill {
 
 // What a file looks like by its first bytes ("AVIF"), where that is not what its name says; empty otherwise.
 std::string_view LooksLike(const std::string& fileName, int32_t formatIndex);
@@ -14,4 +14,4 @@ std::string_view LooksLike(const std::string& fileName, int32_t formatIndex);
 // or which format its name should have selected. Empty when there is nothing to add.
 std::string OpenHint(const std::string& fileName, Status status);
 
-}  // namespace fotomill::cli
+}  // namespace fotomill

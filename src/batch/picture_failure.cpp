@@ -1,10 +1,10 @@
-#include "cli/picture_failure.h"
+#include "batch/picture_failure.h"
 
 #include "picture/picture_record.h"
 #include "picture/registry.h"
 #include "picture/signature.h"
 
-namespace fotomill::cli {
+namespace fotomill {
 
 namespace {
 
@@ -41,4 +41,4 @@ std::string OpenHint(const std::string& fileName, Status status) {
   return std::string(CanRead(FormatRow(index)) ? std::string_view() : WhyNot(FormatRow(index)));
 }
 
-}  // namespace fotomill::cli
+}  // namespace fotomill

@@ -1,0 +1,197 @@
+#include "batch/destination_name.h"
+
+#include "core/plain_name.h"
+#include "core/text.h"
+#include "picture/registry.h"
+#include "platform/paths.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr std::string_view kNotPlain = "The name cannot lead to another folder.";
+constexpr std::string_view kTooLong = "The path would be longer than 260 characters.";
+
+bool FitsPath(const std::string& path) { return path.size() <= PathText::Capacity(); }
+
+// `path` with another base name.
+std::string WithBase(const std::string& path, std::string_view base) {
+  const platform::PathParts parts = platform::SplitPath(path);
+  return platform::JoinPath({parts.drive, parts.folder, base, parts.extension});
+}
+
+bool IsFileName(std::string_view name) { return !name.empty() && IsPlainName(name); }
+
+// Asks until the name can be taken or nobody wants one. The extension stays the format's, cased after the source's.
+bool AskName(std::string& path, const std::string& source, std::string_view title, BatchJob& job) {
+  const std::string extension =
+      CasedExtension(ExtensionOfFormat(job), platform::ExtensionOf(source), job.naming.extensionCase);
+  NameQuestion question{std::string(title), source, path, extension, {}};
+  const std::string folder(platform::SplitPath(path).folder);
+  for (;;) {
+    const std::optional<std::string> typed = job.prompts->AskDestinationName(question);
+    if (!typed) return false;
+    const platform::PathParts parts = platform::SplitPath(*typed);
+    const std::string dotted = "." + extension;
+    const auto whole = CompletedDestination(platform::JoinPath({parts.drive, parts.folder, parts.base, dotted}), folder);
+    if (IsFileName(parts.base) && whole && FitsPath(*whole)) {
+      path = *whole;
+      return true;
+    }
+    question.problem = IsFileName(parts.base) ? kTooLong : kNotPlain;
+  }
+}
+
+// The check boxes that are settings are kept as the user left them.
+void StoreChecks(const OverwriteChecks& old, const OverwriteChecks& now, BatchJob& job) {
+  const struct {
+    KeyNumber key;
+    bool was, is;
+  } flags[] = {
+      {KeyNumber::PromptBeforeOverwrite, old.notify, now.notify},
+      {KeyNumber::OverwriteKeepBoth, old.keepBoth, now.keepBoth},
+      {KeyNumber::OverwritePromptRecycle, old.recycle, now.recycle},
+      {KeyNumber::OverwritePromptPreviews, old.previews, now.previews},
+  };
+  for (const auto& flag : flags) {
+    if (flag.was != flag.is) job.prompts->StoreFlag(flag.key, flag.is);
+  }
+  job.overwrite.prompt = now.notify;
+  job.overwrite.keepBoth = now.keepBoth;
+  job.overwrite.recycle = now.recycle;
+  job.overwrite.previews = now.previews;
+  job.applyToRest = job.applyToRest || now.applyToRest;
+}
+
+DestinationAnswer KeepBoth(Destination& destination, const VariantMaker& variant) {
+  if (variant(destination.path)) return DestinationAnswer::Write;
+  destination.noVariant = true;
+  return DestinationAnswer::Skip;
+}
+
+DestinationAnswer Replace(Destination& destination, const OverwritePolicy& policy) {
+  destination.replace = true;
+  destination.recycle = policy.recycle;
+  return DestinationAnswer::Write;
+}
+
+// Shows the overwrite prompt until a name is settled. A typed name that is taken as well is asked about again.
+DestinationAnswer AskAboutCollision(Destination& destination, const std::string& source, BatchJob& job, const TakenTest& taken,
+                                    const VariantMaker& variant, const PictureRecord* picture) {
+  OverwriteQuestion question{source, {}, {}, {}, picture, {}};
+  for (;;) {
+    const std::string base(platform::SplitPath(destination.path).base);
+    question.path = destination.path;
+    question.name = base;
+    question.checks = {.notify = job.overwrite.prompt,
+                       .keepBoth = job.overwrite.keepBoth,
+                       .applyToRest = job.applyToRest,
+                       .recycle = job.overwrite.recycle,
+                       .previews = job.overwrite.previews};
+    const OverwriteAnswer answer = job.prompts->AskOverwrite(question);
+    if (!answer.ok) {
+      job.overwrite.skip = job.overwrite.skip || answer.skipRest;
+      return DestinationAnswer::Skip;
+    }
+    const bool renamed = !answer.checks.keepBoth && answer.name != base;
+    std::string path = renamed ? WithBase(destination.path, answer.name) : destination.path;
+    if (renamed && (!IsFileName(answer.name) || !FitsPath(path))) {
+      question.problem = IsFileName(answer.name) ? kTooLong : kNotPlain;
+      continue;
+    }
+    StoreChecks(question.checks, answer.checks, job);
+    if (answer.checks.keepBoth) return KeepBoth(destination, variant);
+    destination.path = std::move(path);
+    if (!renamed) {
+      destination.asked = true;
+      return Replace(destination, job.overwrite);
+    }
+    if (!taken(destination.path)) return DestinationAnswer::Write;
+    if (!AsksAboutCollisions(job)) return SettleUnasked(destination, job.overwrite, job.applyToRest, variant);
+    question.problem.clear();
+  }
+}
+
+}  // namespace
+
+std::string CasedExtension(std::string_view formatExtension, std::string_view sourceExtension, int32_t style) {
+  std::string extension = LowerCase(formatExtension);
+  for (size_t i = 0; i < extension.size() && i < sourceExtension.size(); ++i) {
+    if (!IsLetter(extension[i]) || !IsLetter(sourceExtension[i])) continue;
+    const bool upper = style == choice::kCaseUpper ||
+                       (style == choice::kCaseOfSource && sourceExtension[i] != LowerCase(sourceExtension[i]));
+    if (upper) extension[i] = UpperCase(extension[i]);
+  }
+  return extension;
+}
+
+std::string_view ExtensionOfFormat(const BatchJob& job) {
+  if (!job.extension.empty() || job.formatIndex == kNoFormat) return job.extension;
+  return FormatRow(job.formatIndex).extension.view();
+}
+
+std::string PlannedDestination(const std::string& source, std::string_view below, std::string_view prefix,
+                               const BatchJob& job) {
+  const platform::PathParts parts = platform::SplitPath(source);
+  std::string name(prefix);
+  name.append(parts.base).append(1, '.');
+  name += CasedExtension(ExtensionOfFormat(job), platform::ExtensionOf(source), job.naming.extensionCase);
+  if (job.naming.beside || job.destinationFolder.empty()) return platform::JoinPath({parts.drive, parts.folder, name, {}});
+  if (below.empty()) return platform::JoinFolder(job.destinationFolder.view(), name);
+  return platform::JoinFolder(platform::JoinFolder(job.destinationFolder.view(), below), name);
+}
+
+std::optional<std::string> CompletedDestination(const std::string& destination, std::string_view folder) {
+  const platform::PathParts parts = platform::SplitPath(destination);
+  std::string whole = destination;
+  if (parts.drive.empty() && parts.folder.empty()) whole = platform::JoinFolder(folder, destination);
+  if (!FitsPath(whole)) return std::nullopt;
+  return whole;
+}
+
+bool MakeNumberedVariant(std::string& path, int64_t first, int64_t last, const TakenTest& taken) {
+  const std::string base(platform::SplitPath(path).base);
+  for (int64_t number = first; number <= last; ++number) {
+    std::string variant = WithBase(path, base + " [" + std::to_string(number) + "]");
+    if (taken(variant)) continue;
+    path = std::move(variant);
+    return true;
+  }
+  return false;
+}
+
+bool AsksAboutCollisions(const BatchJob& job) {
+  return job.overwrite.prompt && !job.overwrite.skip && !job.applyToRest && job.prompts != nullptr;
+}
+
+// A prompt that is not shown counts as answered with OK; where nobody could have seen it, nothing may be lost.
+DestinationAnswer SettleUnasked(Destination& destination, const OverwritePolicy& policy, bool applyToRest,
+                                const VariantMaker& variant) {
+  if (policy.skip) return DestinationAnswer::Skip;
+  if (!policy.prompt) return Replace(destination, policy);
+  return policy.keepBoth || !applyToRest ? KeepBoth(destination, variant) : Replace(destination, policy);
+}
+
+DestinationAnswer MakeDestinationName(Destination& destination, const std::string& source, std::string_view title,
+                                      BatchJob& job, const TakenTest& taken, const VariantMaker& variant,
+                                      const PictureRecord* picture) {
+  const FormatEntry& row = FormatRow(job.formatIndex);
+  if ((row.flags & FMT_CLIPBOARD) != 0) {
+    destination.path = kClipboardName;
+    return DestinationAnswer::Write;
+  }
+  const bool asked = job.naming.askName && job.prompts != nullptr;
+  if (asked && !AskName(destination.path, source, title, job)) return DestinationAnswer::Skip;
+  DestinationAnswer answer = DestinationAnswer::Write;
+  if (taken(destination.path)) {
+    answer = AsksAboutCollisions(job) ? AskAboutCollision(destination, source, job, taken, variant, picture)
+                                      : SettleUnasked(destination, job.overwrite, job.applyToRest, variant);
+  }
+  if (answer == DestinationAnswer::Skip || !job.naming.askPassword || !TakesPassword(row)) return answer;
+  const auto password = job.prompts != nullptr ? job.prompts->AskPassword(destination.path) : std::nullopt;
+  if (!password) return DestinationAnswer::Skip;
+  destination.password = *password;
+  return answer;
+}
+
+}  // namespace fotomill

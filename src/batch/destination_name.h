@@ -1,0 +1,66 @@
+#pragma once
+
+#include <cstdint>
+#include <functional>
+#include <optional>
+#include <string>
+#include <string_view>
+
+#include "batch/job.h"
+#include "batch/prompts.h"
+
+namespace fotomill {
+
+// The extension of an output, without its dot: the format's own in lower case, then cased letter by letter after the
+// source's extension as `style` says: 0 like the letter in its place, 1 upper, 2 lower. Letters beyond the source's
+// extension, and places where either has no letter, stay as they are.
+std::string CasedExtension(std::string_view formatExtension, std::string_view sourceExtension, int32_t style);
+
+// The extension of the job's outputs as the format has it.
+std::string_view ExtensionOfFormat(const BatchJob& job);
+
+// The path of a source's output before anyone looks whether it is free: the job's destination folder with `below` behind it
+// (the source's own folder where there is none, or where the rules say so), prefix, base name, dot and extension.
+std::string PlannedDestination(const std::string& source, std::string_view below, std::string_view prefix, const BatchJob& job);
+
+// A destination without drive and folder, put into the job's destination folder; others stay. nullopt when that gives 261
+// characters or more.
+std::optional<std::string> CompletedDestination(const std::string& destination, std::string_view folder);
+
+// Whether a path cannot be had for a new file.
+using TakenTest = std::function<bool(const std::string& path)>;
+
+// Replaces `path` by the first of "NAME [first].EXT" to "NAME [last].EXT" that is not taken. False, with `path` as it was,
+// when all are, or when there is no number in the range.
+bool MakeNumberedVariant(std::string& path, int64_t first, int64_t last, const TakenTest& taken);
+
+// The name of an output as it was settled.
+struct Destination {
+  std::string path;
+  bool replace = false;      // a file of that name is to be replaced
+  bool recycle = false;      // and goes to the recycle bin
+  bool asked = false;        // because the user said so of this very file
+  std::string password;      // empty: none
+  bool noVariant = false;    // skipped because no numbered variant is free
+};
+
+inline constexpr std::string_view kClipboardName = "Clipboard";
+inline constexpr std::string_view kWriteAborted = "Unable to create a new file - write aborted.";
+
+enum class DestinationAnswer : int32_t { Write = 1, Skip = 2 };
+
+// Settles the name of an output, whose planned path stands in `destination`: asks for it where the settings say so, and what
+// is to become of a file that has it already. `title` says what the name is for, `picture` is the new picture for previews;
+// both may be missing. `variant` makes numbered variants.
+using VariantMaker = std::function<bool(std::string& path)>;
+DestinationAnswer MakeDestinationName(Destination& destination, const std::string& source, std::string_view title,
+                                      BatchJob& job, const TakenTest& taken, const VariantMaker& variant,
+                                      const PictureRecord* picture = nullptr);
+
+// Whether a collision has to be shown to somebody.
+bool AsksAboutCollisions(const BatchJob& job);
+// What becomes of an output whose name is taken when nobody is asked.
+DestinationAnswer SettleUnasked(Destination& destination, const OverwritePolicy& policy, bool applyToRest,
+                                const VariantMaker& variant);
+
+}  // namespace fotomill

@@ -1,0 +1,71 @@
+#include "batch/progress_model.h"
+
+#include "core/settings.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr int32_t kBoxWidth = 420, kBoxHeight = 430, kFrameMargin = 16;
+constexpr int32_t kListMargin = 5, kBelowList = 64;
+constexpr int32_t kStatusX = 8, kStatusUp = 50, kStatusHeight = 16;
+constexpr int32_t kButtonWidth = 64, kButtonHeight = 22, kButtonUp = 30;
+constexpr int32_t kThumbnailRow = 54;
+
+}  // namespace
+
+ProgressSettings ProgressSettingsInForce() {
+  return {.closeWhenDone = settings.CloseProgressWhenDone != 0,
+          .optimizeWindow = settings.ProgressOptimizeWindow != 0,
+          .thumbnails = settings.ProgressThumbnails != 0,
+          .showMissingThumbnails = settings.ProgressShowMissingThumbnails != 0};
+}
+
+void ProgressModel::Open() {
+  *this = ProgressModel();
+  open_ = abortLive_ = true;
+}
+
+void ProgressModel::AddLine(ProgressLine line) {
+  if (line.item.file >= 0) ++files_;
+  lines_.push_back(std::move(line));
+}
+
+void ProgressModel::Finish(bool errors, bool summary, const ProgressSettings& box) {
+  if (errors) AddLine({std::string(kErrorsLine), {}});
+  if (summary) {
+    AddLine({CountLine(files_), {}});
+    selected_ = static_cast<int32_t>(lines_.size()) - 1;
+  }
+  if (!errors && box.closeWhenDone) return Close();
+  scrollBar_ = closeLive_ = true;
+  abortLive_ = false;
+}
+
+std::string CountLine(uint32_t files) {
+  if (files == 0) return "No files were processed.";
+  if (files == 1) return "One file was processed.";
+  return std::to_string(files) + " files were processed.";
+}
+
+Rectangle ProgressBoxPlace(int32_t frameWidth, int32_t frameHeight, const ProgressSettings& box) {
+  const int32_t height = box.optimizeWindow ? frameHeight - kFrameMargin : kBoxHeight;
+  return {(frameWidth - kBoxWidth) / 2, (frameHeight - height) / 2, kBoxWidth, height};
+}
+
+ProgressLayout LayOutProgressBox(int32_t clientWidth, int32_t clientHeight, const ProgressSettings& box) {
+  const int32_t half = clientWidth / 2;
+  const int32_t buttonX = (half - kButtonWidth) / 2, buttonY = clientHeight - kButtonUp;
+  ProgressLayout layout;
+  layout.list = {kListMargin, kListMargin, clientWidth - 2 * kListMargin, clientHeight - kBelowList};
+  layout.status = {kStatusX, clientHeight - kStatusUp, clientWidth - 2 * kStatusX, kStatusHeight};
+  layout.abort = {buttonX, buttonY, kButtonWidth, kButtonHeight};
+  layout.close = {half + buttonX, buttonY, kButtonWidth, kButtonHeight};
+  if (box.optimizeWindow) {
+    layout.kind = box.showMissingThumbnails ? ProgressListKind::FixedRows : ProgressListKind::VariableRows;
+    if (box.thumbnails && box.showMissingThumbnails) layout.rowHeight = kThumbnailRow;
+  }
+  return layout;
+}
+
+}  // namespace fotomill

@@ -1,0 +1,79 @@
+#pragma once
+
+#include <optional>
+#include <string>
+#include <string_view>
+
+#include "core/key_table.h"
+#include "picture/picture_record.h"
+
+namespace fotomill {
+
+// The texts of the overwrite prompt.
+inline constexpr std::string_view kOverwriteTitle = "Overwrite File";
+inline constexpr std::string_view kOverwriteText =
+    "Click on OK to overwrite the existing file.\nChange the file name and click on Ok for a new name.\n"
+    "Click on Cancel to skip this file.";
+inline constexpr std::string_view kOverwriteHelpPage = "OVERWRITE";
+inline constexpr std::string_view kNotifyText = "Notify me the next time I'm about to overwrite a file";
+inline constexpr std::string_view kNotifyNote =
+    "Note: if you disable this option, it can be re-enabled later in the Setup window.";
+inline constexpr std::string_view kKeepBothText = "Keep both files";
+inline constexpr std::string_view kApplyToRestText = "Apply to rest of batch";
+inline constexpr std::string_view kRecycleText = "Move ovewritten files to recycle bin";
+inline constexpr std::string_view kPreviewsText = "Show previews";
+
+// The five check boxes of the overwrite prompt.
+struct OverwriteChecks {
+  bool notify = true;       // PromptBeforeOverwrite
+  bool keepBoth = true;     // OverwriteKeepBoth
+  bool applyToRest = false; // of this batch; ends with it
+  bool recycle = false;     // OverwritePromptRecycle
+  bool previews = true;     // OverwritePromptPreviews
+  bool operator==(const OverwriteChecks&) const = default;
+};
+
+struct OverwriteQuestion {
+  std::string source;                      // the file that is being worked on
+  std::string path;                        // the output, which exists
+  std::string name;                        // its base name, for the File name field
+  OverwriteChecks checks;                  // as they stand
+  const PictureRecord* picture = nullptr;  // the new picture, for its preview; null when there is none. Valid during the call
+  std::string problem;                     // why the last answer could not be taken, a sentence; empty at first
+};
+
+struct OverwriteAnswer {
+  bool ok = false;         // false: this file is skipped and nothing else is looked at
+  OverwriteChecks checks;
+  std::string name;        // of the File name field: without folder and extension
+  bool skipRest = false;   // not ok, and so for every collision of this batch
+};
+
+struct NameQuestion {
+  std::string title;      // what the name is for; may be empty
+  std::string source;
+  std::string path;       // the name that is offered
+  std::string extension;  // of the format, without dot
+  std::string problem;    // as above
+};
+
+// What a batch asks its user. Faces implement it; every call comes from the thread that called the batch, blocks until
+// there is an answer, and comes in the order of the selection.
+class Prompts {
+ public:
+  virtual ~Prompts() = default;
+  // The name of an output; nullopt skips the file.
+  virtual std::optional<std::string> AskDestinationName(const NameQuestion& question) = 0;
+  virtual OverwriteAnswer AskOverwrite(const OverwriteQuestion& question) = 0;
+  // The password that protects an output; nullopt skips the file.
+  virtual std::optional<std::string> AskPassword(const std::string& path) = 0;
+  // "Write files to the PNG format?" False ends the batch before it begins.
+  virtual bool ConfirmFormat(const std::string& question) = 0;
+  // Whether a destination folder that is not there may be made. False ends the batch before it begins.
+  virtual bool ConfirmNewFolder(const std::string& folder) = 0;
+  // The user changed one of the check boxes that are settings. The base class stores it for good, on the calling thread;
+  // a face whose configuration belongs to another thread hands it over there.
+  virtual void StoreFlag(KeyNumber key, bool value);
+};
+
+}  // namespace fotomill

@@ -1,0 +1,385 @@
+#include "batch/run.h"
+
+#include <algorithm>
+#include <atomic>
+#include <memory>
+#include <mutex>
+#include <new>
+
+#include "batch/abort.h"
+#include "batch/destination_name.h"
+#include "batch/ordered_run.h"
+#include "batch/picture_failure.h"
+#include "batch/prompts.h"
+#include "batch/run_names.h"
+#include "core/settings.h"
+#include "core/text.h"
+#include "metadata/picture_exif.h"
+#include "picture/registry.h"
+#include "platform/clock.h"
+#include "platform/files.h"
+#include "platform/folders.h"
+#include "platform/paths.h"
+#include "platform/process.h"
+#include "processing/reduce.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr int kMostLostRaces = 100;
+constexpr const char* kTooLong = "Its path would be longer than 260 characters.";
+
+std::string FolderOf(const std::string& path) {
+  const platform::PathParts parts = platform::SplitPath(path);
+  return std::string(parts.drive) + std::string(parts.folder);
+}
+
+// Whether names are settled by more than a look at the folder.
+bool AsksEveryName(const BatchJob& job) {
+  const FormatEntry& row = FormatRow(job.formatIndex);
+  if ((row.flags & FMT_CLIPBOARD) != 0) return true;
+  return job.prompts != nullptr && (job.naming.askName || (job.naming.askPassword && TakesPassword(row)));
+}
+
+FileOutcome Failure(const BatchFile& file, Status status, std::string hint = {}) {
+  return {.source = file.name, .destination = {}, .status = status, .hint = std::move(hint), .note = {}};
+}
+
+class Batch {
+ public:
+  Batch(std::span<const BatchFile> files, const BatchFunction& function, BatchJob& job)
+      : files_(files), function_(function), job_(job), asksEveryName_(AsksEveryName(job)), outcomes_(files.size()) {
+    for (const BatchFile& file : files_) {
+      if (file.status == Status::Ok) names_.AddSource(file.name, Planned(file));
+    }
+    TakeRules();
+  }
+
+  void Run() {
+    OrderedRun run({.work = [this](size_t i) { Work(i); },
+                    .deliver = [this](size_t i) { Deliver(i); },
+                    .goesOn = [this] { return !ended_ && !AbortAsked(); },
+                    .tick = [this] { Tick(); }});
+    run_ = &run;
+    run.Run(files_.size(), function_.jobs == 0 ? platform::CoreCount() : function_.jobs);
+  }
+
+ private:
+  // What decides about a collision, as it stood when the last question was answered.
+  struct Rules {
+    OverwritePolicy overwrite;
+    bool applyToRest = false;
+    bool asks = false;
+  };
+
+  void TakeRules() { rules_ = {job_.overwrite, job_.applyToRest, AsksAboutCollisions(job_)}; }
+
+  std::string Planned(const BatchFile& file) const {
+    if (!function_.out.empty()) return function_.out;
+    return PlannedDestination(file.name, function_.keepTree ? file.below : std::string(), function_.prefix, job_);
+  }
+
+  // On any thread: one file from its source to its output.
+  void Work(size_t i) {
+    auto outcome = std::make_unique<FileOutcome>();
+    try {
+      *outcome = Process(i);
+    } catch (const std::bad_alloc&) {
+      *outcome = Failure(files_[i], Status::MemoryAllocationError);
+    }
+    outcomes_[i] = std::move(outcome);
+  }
+
+  // On the calling thread, in the order of the selection.
+  void Deliver(size_t i) {
+    const std::unique_ptr<FileOutcome> outcome = std::move(outcomes_[i]);
+    if (outcome->status == Status::FunctionCancelled) return;  // given up by Abort before it had a name
+    job_.source.AssignCut(outcome->source);
+    const bool written = outcome->status == Status::Ok && !outcome->skipped && !function_.dryRun;
+    if (written) NoteUse(outcome->source);
+    job_.filesChanged = job_.filesChanged || written;
+    if (outcome->skipped && outcome->status != Status::Ok) ++job_.writeAborts;
+    ReportOutcome(job_, *outcome, static_cast<uint32_t>(i), static_cast<uint32_t>(files_.size()));
+    if (job_.box != nullptr && !job_.box->GoesOn()) ended_ = true;
+  }
+
+  void Tick() {
+    if (job_.box == nullptr) return;
+    job_.box->Tick();
+    if (!job_.box->GoesOn()) ended_ = true;
+  }
+
+  void NoteUse(const std::string& source) {
+    if ((settings.FileHistoryFunctions >> static_cast<int32_t>(function_.history) & 1) == 0) return;
+    job_.uses.push_back({platform::AbsolutePath(source), function_.history, kOwnTime,
+                         static_cast<int32_t>(platform::Now()), false});
+  }
+
+  FileOutcome Process(size_t i) {
+    const BatchFile& file = files_[i];
+    if (file.status != Status::Ok) return Failure(file, file.status, file.hint);
+    Destination destination;
+    destination.path = Planned(file);
+    if (destination.path.size() > PathText::Capacity()) return Failure(file, Status::InvalidDestination, kTooLong);
+    // Where another file's output may take this source's place, the order of the selection says which comes first.
+    if (names_.IsOutputOfOthers(file.name, destination.path) && !run_->InTurn(i, [] {})) return Cancelled(file);
+    if (IsLeftOut(i, destination)) return Skipped(file, destination);
+    PicturePointer picture;
+    if (const Status status = Load(file.name, picture); status != Status::Ok) {
+      return Failure(file, status, LoadHint(file.name, status, picture.get()));
+    }
+    // The source may have bound its own plug-in format to the row that the destination's had.
+    if (job_.formatIndex == kSpareRow) (void)FindPluginFormat("x." + job_.extension);
+    if (const Status status = Change(*picture); status != Status::Ok) {
+      return Failure(file, status, status == Status::TooManyColors ? function_.reduceHint : std::string());
+    }
+    return WriteUnderFreeName(i, std::move(destination), *picture);
+  }
+
+  static FileOutcome Cancelled(const BatchFile& file) { return Failure(file, Status::FunctionCancelled); }
+
+  static FileOutcome Skipped(const BatchFile& file, const Destination& destination) {
+    FileOutcome outcome{.source = file.name, .destination = destination.path, .hint = {}, .skipped = true, .note = {}};
+    if (destination.noVariant) {
+      outcome.status = Status::ErrorCreatingFile;
+      outcome.destination.clear();
+      outcome.hint = kWriteAborted;
+    } else {
+      outcome.hint = "skipped, " + destination.path + " exists.";
+    }
+    return outcome;
+  }
+
+  // Whether a file is only going to be skipped; it need not be decoded then.
+  bool IsLeftOut(size_t i, const Destination& destination) {
+    const std::string& source = files_[i].name;
+    {
+      const std::lock_guard lock(mutex_);
+      if (!rules_.overwrite.skip) return false;
+      if (IsIndependent(source, destination.path)) return names_.Taken(destination.path, source);
+    }
+    bool taken = false;
+    (void)run_->InTurn(i, [&] { taken = IsTaken(destination.path, source); });
+    return taken;
+  }
+
+  Status Load(const std::string& name, PicturePointer& picture) const {
+    RETURN_IF_BAD(LoadPictureInfo(name.c_str(), picture));
+    picture->page = function_.page - 1;
+    if (function_.dryRun) return function_.page > picture->pageCount ? Status::NoImages : Status::Ok;
+    RETURN_IF_BAD(ReadPicture(*picture));
+    return function_.autoOrient ? TurnUpright(*picture) : Status::Ok;
+  }
+
+  std::string LoadHint(const std::string& name, Status status, const PictureRecord* picture) const {
+    if (picture == nullptr || status != Status::NoImages || function_.page <= picture->pageCount) {
+      return OpenHint(name, status);
+    }
+    return picture->pageCount == 1 ? "It has one page." : "It has " + std::to_string(picture->pageCount) + " pages.";
+  }
+
+  // The function's own work, then the depth that the format takes.
+  Status Change(PictureRecord& picture) const {
+    if (function_.transform && !function_.dryRun) RETURN_IF_BAD(function_.transform(picture));
+    const auto deepest = static_cast<int32_t>(FormatRow(job_.formatIndex).maxBits);
+    if (picture.bitsPerPixel <= deepest) return Status::Ok;
+    if (!function_.reduce) return Status::TooManyColors;
+    return function_.dryRun ? Status::Ok : ReduceColors(picture, deepest);
+  }
+
+  // Settles the name and writes, again when someone else has taken the name since it was found free.
+  FileOutcome WriteUnderFreeName(size_t i, Destination planned, PictureRecord& picture) {
+    const BatchFile& file = files_[i];
+    for (int attempt = 0; attempt < kMostLostRaces; ++attempt) {
+      Destination destination = planned;
+      bool cancelled = false;
+      if (Settle(i, destination, picture, cancelled) == DestinationAnswer::Skip) {
+        return cancelled ? Cancelled(file) : Skipped(file, destination);
+      }
+      if (destination.path.size() > PathText::Capacity()) {
+        GiveBack(destination.path);
+        return Failure(file, Status::InvalidDestination, kTooLong);
+      }
+      const bool replaces = destination.replace && platform::FileExists(destination.path);
+      const Status status = function_.dryRun ? Status::Ok : Write(picture, destination);
+      if (status == Status::Ok) return Written(file, destination, replaces, picture);
+      GiveBack(destination.path);
+      const bool lostRace =
+          status == Status::ErrorCreatingFile && !destination.replace && platform::IsRegularFile(destination.path);
+      if (!lostRace) return Failure(file, status, WriteHint(destination, status));
+    }
+    return Failure(file, Status::ErrorCreatingFile, std::string(kWriteAborted));
+  }
+
+  void GiveBack(const std::string& path) {
+    const std::lock_guard lock(mutex_);
+    names_.TakeBack(path);
+  }
+
+  DestinationAnswer Settle(size_t i, Destination& destination, const PictureRecord& picture, bool& cancelled) {
+    DestinationAnswer answer = DestinationAnswer::Skip;
+    if (SettleAtOnce(files_[i].name, destination, answer)) return answer;
+    const bool done = run_->InTurn(i, [&] { answer = SettleInTurn(files_[i].name, destination, picture, cancelled); });
+    cancelled = cancelled || !done;
+    return answer;
+  }
+
+  // Whether what happens to other files of the run changes nothing about this one's name.
+  bool IsIndependent(const std::string& source, const std::string& planned) const {
+    return function_.out.empty() && names_.ConcernsNobodyElse(source, planned);
+  }
+
+  // Settles a name without waiting for the files before, where they cannot matter and nobody has to be asked. False when it
+  // cannot be done; the destination is as it was then.
+  bool SettleAtOnce(const std::string& source, Destination& destination, DestinationAnswer& answer) {
+    const std::lock_guard lock(mutex_);
+    if (asksEveryName_ || !IsIndependent(source, destination.path)) return false;
+    Destination settled = destination;
+    answer = DestinationAnswer::Write;
+    if (names_.Taken(settled.path, source)) {
+      if (rules_.asks) return false;
+      bool free = true;
+      const TakenTest taken = [&](const std::string& path) {
+        free = !names_.IsExpected(path);
+        return free && names_.Taken(path, source);
+      };
+      answer = SettleUnasked(settled, rules_.overwrite, rules_.applyToRest,
+                             [&](std::string& path) { return MakeVariant(path, taken); });
+      if (!free) {
+        names_.ForgetVariants();
+        return false;
+      }
+    }
+    destination = std::move(settled);
+    if (answer == DestinationAnswer::Write) names_.Give(destination.path);
+    return true;
+  }
+
+  // The same when every file before this one is done.
+  DestinationAnswer SettleInTurn(const std::string& source, Destination& destination, const PictureRecord& picture,
+                                 bool& cancelled) {
+    cancelled = AbortAsked();
+    if (cancelled) return DestinationAnswer::Skip;
+    const TakenTest taken = [&](const std::string& path) { return IsTaken(path, source); };
+    const VariantMaker variant = [&](std::string& path) {
+      const std::lock_guard lock(mutex_);
+      return MakeVariant(path, [&](const std::string& candidate) { return names_.Taken(candidate, source); });
+    };
+    DestinationAnswer answer = MakeDestinationName(destination, source, {}, job_, taken, variant, &picture);
+    // Unless the user said so of this very file, the files of one run never replace each other.
+    if (answer == DestinationAnswer::Write && destination.replace && !destination.asked && IsOfRun(destination.path, source)) {
+      destination.replace = destination.recycle = false;
+      if (!variant(destination.path)) {
+        destination.noVariant = true;
+        answer = DestinationAnswer::Skip;
+      }
+    }
+    const std::lock_guard lock(mutex_);
+    TakeRules();
+    if (answer == DestinationAnswer::Write) names_.Give(destination.path);
+    return answer;
+  }
+
+  bool IsTaken(const std::string& path, const std::string& source) const {
+    const std::lock_guard lock(mutex_);
+    return names_.Taken(path, source);
+  }
+
+  bool IsOfRun(const std::string& path, const std::string& source) const {
+    const std::lock_guard lock(mutex_);
+    return names_.TakenByRun(path, source);
+  }
+
+  bool MakeVariant(std::string& path, const TakenTest& taken) {
+    return names_.MakeVariant(path, job_.naming.firstVariant, job_.naming.lastVariant, taken);
+  }
+
+  // Codecs may take less than their row says; colours are then reduced further, step by step.
+  Status Write(PictureRecord& picture, const Destination& destination) const {
+    const bool ownFolder = job_.naming.beside || job_.destinationFolder.empty() || !function_.out.empty();
+    if (!ownFolder && !platform::MakeFolders(FolderOf(destination.path))) return Status::ErrorCreatingFile;
+    WriteOptions write;
+    write.existing = destination.replace ? platform::Existing::Replace : platform::Existing::Refuse;
+    write.keepMetadata = function_.keepMetadata;
+    write.password = destination.password;
+    if (destination.recycle) {
+      write.makeWay = [&] { return !platform::FileExists(destination.path) || platform::MoveToTrash(destination.path); };
+    }
+    const PathText source = picture.fileName;
+    RefreshExif(picture);
+    Status status = WritePictureAs(picture, destination.path, job_.formatIndex, write);
+    for (const int32_t bits : {8, 4, 1}) {
+      if (status != Status::TooManyColors || !function_.reduce) break;
+      if (picture.bitsPerPixel <= bits) continue;
+      RETURN_IF_BAD(ReduceColors(picture, bits));
+      status = WritePictureAs(picture, destination.path, job_.formatIndex, write);
+    }
+    picture.fileName = source;
+    return status;
+  }
+
+  FileOutcome Written(const BatchFile& file, const Destination& destination, bool replaces, const PictureRecord& picture) const {
+    if (function_.keepTimes && !function_.dryRun && !platform::CopyTimes(file.name, destination.path)) {
+      return Failure(file, Status::ErrorWritingFile, destination.path + " was written, but its time could not be set.");
+    }
+    return {.source = file.name, .destination = destination.path, .hint = {}, .replaced = replaces, .note = LostMetadata(picture)};
+  }
+
+  // Metadata that the format cannot hold are not lost in silence, for who wants to know.
+  std::string LostMetadata(const PictureRecord& picture) const {
+    const FormatEntry& row = FormatRow(job_.formatIndex);
+    if (!function_.keepMetadata || picture.metadata.Empty() || KeepsMetadata(row)) return {};
+    std::string lost;
+    if (!picture.metadata.exif.empty()) lost += ", EXIF";
+    if (!picture.metadata.xmp.empty()) lost += ", XMP";
+    if (!picture.metadata.icc.empty()) lost += ", color profile";
+    return std::string(row.extension.view()) + " cannot hold its " + lost.substr(2) + ".";
+  }
+
+  std::string WriteHint(const Destination& destination, Status status) const {
+    if (status == Status::TooManyColors) return function_.reduce ? std::string() : function_.reduceHint;
+    if (status != Status::ErrorCreatingFile) return {};
+    const std::string& path = destination.path;
+    const std::string folder = FolderOf(path);
+    if (platform::IsFolder(path)) return "\"" + path + "\" is a folder.";
+    if (!folder.empty() && !platform::IsFolder(folder)) return "There is no folder \"" + folder + "\".";
+    if (destination.recycle && !platform::HasTrash(path)) return "\"" + path + "\" has no recycle bin to go to.";
+    return "\"" + path + "\" cannot be made.";
+  }
+
+  const std::span<const BatchFile> files_;
+  const BatchFunction& function_;
+  BatchJob& job_;
+  const bool asksEveryName_;
+  std::vector<std::unique_ptr<FileOutcome>> outcomes_;  // of files that are done and not yet reported
+  OrderedRun* run_ = nullptr;
+  std::atomic<bool> ended_{false};
+  mutable std::mutex mutex_;  // over what follows
+  RunNames names_;
+  Rules rules_;
+};
+
+// What is asked before anything is begun. False when the user does not want it.
+bool IsWanted(const BatchFunction& function, const BatchJob& job) {
+  if (job.prompts == nullptr || function.dryRun) return true;
+  if (settings.WarnDestinationWrite != 0) {
+    const std::string format(UpperCase(ExtensionOfFormat(job)));
+    if (!job.prompts->ConfirmFormat("Write files to the " + format + " format?")) return false;
+  }
+  const std::string folder(job.destinationFolder.view());
+  const bool ownFolder = folder.empty() || job.naming.beside || !function.out.empty();
+  return ownFolder || platform::FileExists(folder) || job.prompts->ConfirmNewFolder(folder);
+}
+
+}  // namespace
+
+Status RunBatch(std::span<const BatchFile> files, const BatchFunction& function, BatchJob& job) {
+  job.extension = ExtensionOfFormat(job);
+  if (!IsWanted(function, job) || !OpenProgressBox(job)) return Status::FunctionCancelled;
+  Batch(files, function, job).Run();
+  FinishProgress(job);
+  return Status::Ok;
+}
+
+}  // namespace fotomill

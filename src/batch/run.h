@@ -1,0 +1,45 @@
+#pragma once
+
+#include <cstdint>
+#include <functional>
+#include <span>
+#include <string>
+
+#include "batch/job.h"
+
+namespace fotomill {
+
+// One file of the selection.
+struct BatchFile {
+  std::string name;
+  std::string below;           // folder beneath the one that was chosen, "" or "a/b": for outputs that keep the tree
+  Status status = Status::Ok;  // what is known to be wrong with it already; it is reported and not opened
+  std::string hint;            // what goes behind the message of such a failure
+};
+
+// What a function does to every file of its selection.
+struct BatchFunction {
+  // Works on the decoded picture; empty when it is only converted. Called on several threads at once, on a picture each.
+  std::function<Status(PictureRecord& picture)> transform;
+  FileFunction history = FileFunction::Convert;  // under which the sources go into the file history
+  std::string prefix;         // in front of every name: at most 32 characters, a plain name
+  std::string out;            // not empty: the whole path of the output of a selection of one
+  int32_t page = 1;           // of files with several, from 1
+  uint32_t jobs = 0;          // pictures in work at a time; 0: one a core
+  bool reduce = false;        // colours of pictures that are too deep for the format are reduced
+  std::string reduceHint;     // goes behind "Too many colors." where they are not
+  bool autoOrient = false;    // pictures are turned upright as their EXIF says
+  bool keepMetadata = true;   // EXIF, XMP and colour profiles go along
+  bool keepTimes = false;     // outputs get the times of their sources
+  bool keepTree = false;      // folders of the selection are made again in the destination folder
+  bool dryRun = false;        // nothing is written; outcomes are those of a run, as far as they can be told
+};
+
+// Runs a function over a selection: opens the job's progress box, asks what has to be asked, converts, reports every file
+// in selection order, gathers what the file history shall know, and finishes the box. Decoding, transforming and encoding
+// go on on several threads; everything else happens on the calling thread in the order of the selection, so that outputs,
+// names, questions and lines are those of a run with one. After Abort nothing new is begun, and what is in work is finished
+// or leaves nothing behind. Ok, or FunctionCancelled when the user did not want it to begin.
+Status RunBatch(std::span<const BatchFile> files, const BatchFunction& function, BatchJob& job);
+
+}  // namespace fotomill

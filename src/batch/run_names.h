@@ -1,0 +1,54 @@
+#pragma once
+
+#include <cstdint>
+#include <string>
+#include <unordered_map>
+#include <unordered_set>
+
+#include "batch/destination_name.h"
+
+namespace fotomill {
+
+// The names that one run deals with: those of its sources, those it has given to outputs, and those of files that are there.
+// Not for two threads at a time.
+class RunNames {
+ public:
+  RunNames();
+
+  // A source of the run, and the path that its output would have.
+  void AddSource(const std::string& source, const std::string& planned);
+
+  // Whether no other file of the run is concerned when this one's output is given its planned name.
+  bool ConcernsNobodyElse(const std::string& source, const std::string& planned) const;
+  // Whether a path is a source or a planned output of the run.
+  bool IsExpected(const std::string& path) const;
+
+  // Whether the output of another file of the run may come to lie where this source is.
+  bool IsOutputOfOthers(const std::string& source, const std::string& planned) const;
+
+  // Whether another file of the run has the path as its source, or has been given it for its output.
+  bool TakenByRun(const std::string& path, const std::string& source) const;
+  // The same, or there is a file of that name.
+  bool Taken(const std::string& path, const std::string& source) const;
+
+  // Gives a path to an output.
+  void Give(const std::string& path);
+  // The output was not written: its name is free again.
+  void TakeBack(const std::string& path);
+  // A variant that was found is not used.
+  void ForgetVariants() { variants_.clear(); }
+
+  // As MakeNumberedVariant; numbers that this run has found taken before are not tried again.
+  bool MakeVariant(std::string& path, int64_t first, int64_t last, const TakenTest& taken);
+
+ private:
+  std::string Key(const std::string& path) const;
+
+  std::string folder_;  // what relative paths are relative to
+  std::unordered_map<std::string, uint32_t> sources_;  // how often each is there
+  std::unordered_map<std::string, uint32_t> planned_;
+  std::unordered_set<std::string> given_;
+  std::unordered_map<std::string, int64_t> variants_;  // the number to go on with, by the path without one
+};
+
+}  // namespace fotomill
