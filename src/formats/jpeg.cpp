@@ -200,7 +200,7 @@ Status DescribePicture(const jpeg_decompress_struct& info, PictureRecord& pictur
   return picture.width < 1 || picture.height < 1 ? Status::DamagedFile : Status::Ok;
 }
 
-// Sets what comes out: colours, and the smallest size in eighths whose longer side is still twice the side asked for.
+// Sets what comes out: colours, and the smallest size in eighths whose longer edge is still twice the side asked for.
 void SetOutput(jpeg_decompress_struct& info, int32_t thumbnailSide) {
   info.out_color_space = IsGrey(info) ? JCS_GRAYSCALE : IsCmyk(info) ? JCS_CMYK : JCS_EXT_BGR;
   info.scale_denom = 8;

@@ -85,8 +85,9 @@ struct PictureRecord {
   int32_t pageCount = 1;      // pages or frames in the file
   int32_t hotSpotX = 0, hotSpotY = 0;  // of a cursor, pixels from the left and the top
   int32_t page = 0;           // the page that `read` is to decode, from 0
-  int32_t thumbnailSide = 0;  // above 0: a decoder may deliver any smaller size whose shorter use still gives at least
-                              // twice this square; `width` and `height` keep the full size, `image` tells its own
+  int32_t thumbnailSide = 0;  // above 0: a decoder may deliver any smaller size that is still twice that of the largest
+                              // picture inside this square, which is what its longer edge decides; `width` and `height`
+                              // keep the full size, `image` tells its own
   ProgressSink* progress = nullptr;   // not owned, may be null
 
   void ReportRow(int32_t done) const { ReportRow(done, height); }

@@ -2,13 +2,20 @@
 
 #include <algorithm>
 #include <cstring>
+#include <iterator>
 
+#include "core/choice_lists.h"
 #include "platform/memory.h"
 #include "processing/promote.h"
 
 namespace fotomill {
 
 namespace {
+
+// In the order of choice::ResampleFilter.
+constexpr ScaleFilter kFilterOfKey[] = {ScaleFilter::Bicubic, ScaleFilter::Lanczos, ScaleFilter::Bilinear, ScaleFilter::Nearest};
+static_assert(kFilterOfKey[choice::kBicubic] == ScaleFilter::Bicubic && kFilterOfKey[choice::kLanczos] == ScaleFilter::Lanczos &&
+              kFilterOfKey[choice::kBilinear] == ScaleFilter::Bilinear && kFilterOfKey[choice::kNearest] == ScaleFilter::Nearest);
 
 // The source pixel under the middle of pixel `i` of `count`.
 constexpr int32_t SourcePixel(int32_t i, int32_t count, int32_t sourceCount) {
@@ -51,8 +58,7 @@ Size SizeAtPercentage(int32_t width, int32_t height, int32_t percentage) {
 }
 
 ScaleFilter ScaleFilterFromKey(int32_t value) {
-  return value >= 0 && value <= static_cast<int32_t>(ScaleFilter::Nearest) ? static_cast<ScaleFilter>(value)
-                                                                           : ScaleFilter::Lanczos;
+  return kFilterOfKey[std::clamp<int32_t>(value, 0, std::size(kFilterOfKey) - 1)];
 }
 
 Status ScaleNearest(const PackedImage& image, Size size, PackedImage& scaled) {

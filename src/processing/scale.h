@@ -20,14 +20,14 @@ Size FitSize(int32_t width, int32_t height, int32_t side);
 // What both edges become at a percentage: edge x percentage / 100, rounded down, at least 1, at most 2^31 - 1.
 Size SizeAtPercentage(int32_t width, int32_t height, int32_t percentage);
 
-// How a pixel between others gets its value; the numbers are those of the keys ResizeFilter and ThumbnailZoomFilter.
-enum class ScaleFilter : int32_t {
-  Lanczos = 0,   // windowed sinc of three lobes: the sharpest
-  Bicubic = 1,   // cubic convolution with a = -1/2 (Keys 1981)
-  Bilinear = 2,  // triangle
-  Nearest = 3,   // the nearest pixel as it is
+// How a pixel between others gets its value.
+enum class ScaleFilter {
+  Lanczos,   // windowed sinc of three lobes: the sharpest
+  Bicubic,   // cubic convolution with a = -1/2 (Keys 1981)
+  Bilinear,  // triangle
+  Nearest,   // the nearest pixel as it is
 };
-// Numbers that no filter has mean Lanczos.
+// The filter that a value of the keys ResizeFilter and ThumbnailZoomFilter selects; beyond the list, its nearest entry.
 ScaleFilter ScaleFilterFromKey(int32_t value);
 
 // Scales by picking the source pixel under the middle of each new one. An image keeps its depth and colours; an alpha

@@ -6,6 +6,7 @@
 #include <numbers>
 #include <random>
 
+#include "core/choice_lists.h"
 #include "platform/fault.h"
 #include "processing/orient.h"
 #include "processing/pictures.h"
@@ -47,6 +48,19 @@ TEST(Scale, Sizes) {
     EXPECT_EQ(scaled.width, row.scaled.width);
     EXPECT_EQ(scaled.height, row.scaled.height);
   }
+}
+
+TEST(Scale, KeysSelectTheFilterThatTheirListNames) {
+  constexpr std::pair<const char*, ScaleFilter> names[] = {{"Lanczos", ScaleFilter::Lanczos}, {"Bicubic", ScaleFilter::Bicubic},
+                                                           {"Bilinear", ScaleFilter::Bilinear}, {"Nearest", ScaleFilter::Nearest}};
+  const ChoiceEntry* entry = kResampleChoices;
+  for (; entry->text != nullptr; ++entry) {
+    for (const auto& [name, filter] : names) {
+      EXPECT_EQ(ScaleFilterFromKey(entry->value) == filter, std::string_view(entry->text).starts_with(name)) << entry->text << name;
+    }
+  }
+  EXPECT_EQ(ScaleFilterFromKey(-1), ScaleFilter::Bicubic);
+  EXPECT_EQ(ScaleFilterFromKey(INT32_MAX), ScaleFilter::Nearest);
 }
 
 // The value of every pixel by the filter's definition, in floating point, pixel by pixel in both directions at once.
