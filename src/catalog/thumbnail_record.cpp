@@ -39,19 +39,20 @@ Status ScaleToFit(const PictureRecord& picture, ScaledPicture& scaled) {
   return ScaleFiltered(picture.image, picture.alpha, size, ScaleFilter::Lanczos, scaled.image, scaled.alpha);
 }
 
-Status PlaceInSquare(const ScaledPicture& scaled, Color background, Mix mix, ThumbnailRecord& record) {
+template <typename Record>
+Status PlaceInSquare(const ScaledPicture& scaled, Color background, Mix mix, Record& record) {
   const uint8_t matte[] = {static_cast<uint8_t>(background >> 16), static_cast<uint8_t>(background >> 8),
                            static_cast<uint8_t>(background)};
-  ThumbnailRecord made;
+  Record made;
   made.Sign();
-  for (size_t i = kThumbnailHeaderSize; i < made.bytes.size(); ++i) made.bytes[i] = matte[(i - kThumbnailHeaderSize) % 3];
+  made.Fill(background);
 
   BgrRows rows;
   RETURN_IF_BAD(rows.Open(scaled.image));
-  const int32_t width = std::min(scaled.image.Width(), kSmallThumbnailSide);
-  const int32_t height = std::min(scaled.image.Height(), kSmallThumbnailSide);
-  const auto left = static_cast<size_t>((kSmallThumbnailSide - width) / 2) * 3;
-  const int32_t bottom = (kSmallThumbnailSide - height) / 2;
+  const int32_t width = std::min(scaled.image.Width(), Record::kSide);
+  const int32_t height = std::min(scaled.image.Height(), Record::kSide);
+  const auto left = static_cast<size_t>((Record::kSide - width) / 2) * 3;
+  const int32_t bottom = (Record::kSide - height) / 2;
   for (int32_t r = 0; r < height; ++r) {
     const int32_t y = scaled.image.Height() - 1 - r;
     const uint8_t* const from = rows.Row(y);
@@ -115,6 +116,15 @@ bool MakeBlendedThumbnailRecord(ThumbnailRecord& record, const PictureRecord& pi
   ScaledPicture scaled;
   return !picture.image.Empty() && ScaleQuickly(picture, scaled) == Status::Ok &&
          PlaceInSquare(scaled, background, MixEachRoundedDown, record) == Status::Ok;
+}
+
+bool MakeLargeThumbnailRecord(LargeThumbnailRecord& record, const PictureRecord& picture) {
+  if (picture.image.Empty()) return false;
+  Size size{picture.image.Width(), picture.image.Height()};
+  if (std::max(size.width, size.height) > kLargeThumbnailSide) size = FitSize(size.width, size.height, kLargeThumbnailSide);
+  ScaledPicture scaled;
+  return ScaleFiltered(picture.image, picture.alpha, size, ScaleFilter::Lanczos, scaled.image, scaled.alpha) == Status::Ok &&
+         PlaceInSquare(scaled, static_cast<Color>(settings.ThumbnailMatte), Blend, record) == Status::Ok;
 }
 
 Status ThumbnailRecordToBitmap(const ThumbnailRecord& record, PackedImage& bitmap) { return ToBitmap(record, bitmap); }

@@ -49,6 +49,12 @@ struct SquareThumbnailRecord {
     bytes[4] = kThumbnailVersion & 0xff;
     bytes[5] = kThumbnailVersion >> 8;
   }
+  // Gives all pixels one colour.
+  void Fill(Color color) {
+    for (size_t i = kThumbnailHeaderSize; i < bytes.size(); ++i) {
+      bytes[i] = static_cast<uint8_t>(color >> (16 - 8 * ((i - kThumbnailHeaderSize) % 3)));
+    }
+  }
   // Row r in stored order, from the bottom.
   std::span<uint8_t> StoredRow(int32_t r) {
     return std::span(bytes).subspan(kThumbnailHeaderSize + static_cast<size_t>(r) * kStride, kStride);
@@ -72,6 +78,9 @@ void ExpandOldRecord(ThumbnailRecord& record);
 bool MakeThumbnailRecord(ThumbnailRecord& record, const PictureRecord& picture);
 // The same by the quick scaler only, alpha blended with `background`, each product rounded down by itself.
 bool MakeBlendedThumbnailRecord(ThumbnailRecord& record, const PictureRecord& picture, Color background);
+// A large record: a picture that does not fit is scaled down by the filtered scaler, a smaller one stays as large as it is;
+// alpha is flattened onto ThumbnailMatte.
+bool MakeLargeThumbnailRecord(LargeThumbnailRecord& record, const PictureRecord& picture);
 
 // A new 24-bit bitmap with the record's pixels. Statuses as NewPackedImage.
 Status ThumbnailRecordToBitmap(const ThumbnailRecord& record, PackedImage& bitmap);

@@ -8,8 +8,8 @@
 
 namespace fotomill::platform {
 
-// Much room of which little will be used: address space whose pages the system gives, zero and a small one at a time, when
-// they are first touched, and takes back at once when the room is freed.
+// Much room of which little will be used: address space whose pages the system gives, zero and a small one at a time,
+// when they are first touched, and takes back at once when the room is freed.
 class ReservedMemory {
  public:
   ReservedMemory() = default;

@@ -1,0 +1,82 @@
+#include "catalog/system_thumbnail.h"
+
+#include <algorithm>
+
+#include "core/byte_reader.h"
+#include "core/md5.h"
+#include "core/whole_number.h"
+#include "formats/png.h"
+#include "formats/png_chunks.h"
+#include "platform/file_view.h"
+#include "platform/files.h"
+#include "platform/folders.h"
+#include "platform/paths.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr int32_t kLongestSide = 256;
+constexpr std::string_view kUriKey = "Thumb::URI", kTimeKey = "Thumb::MTime";
+constexpr std::string_view kAllowedMarks = "-_.!~*'():@&=+$,/";
+
+std::string CachedFile(std::string_view uri) {
+  const std::string cache = platform::SpecialFolderPath(platform::SpecialFolder::Cache);
+  if (cache.empty()) return {};
+  const std::span bytes(reinterpret_cast<const uint8_t*>(uri.data()), uri.size());
+  return platform::JoinFolder(platform::JoinFolder(platform::JoinFolder(cache, "thumbnails"), "large"),
+                              Md5Text(bytes) + ".png");
+}
+
+// The value of a text chunk with that key.
+bool HasText(std::span<const uint8_t> file, std::string_view key, std::string_view& value) {
+  PngChunks chunks(file);
+  for (PngChunk chunk; chunks.Next(chunk);) {
+    if (chunk.type != "tEXt") continue;
+    const std::string_view text(reinterpret_cast<const char*>(chunk.data.data()), chunk.data.size());
+    const size_t end = text.find('\0');
+    if (end == std::string_view::npos || text.substr(0, end) != key) continue;
+    value = text.substr(end + 1);
+    return true;
+  }
+  return false;
+}
+
+bool IsOf(std::span<const uint8_t> file, std::string_view uri, int64_t modified) {
+  std::string_view savedUri, savedTime;
+  if (!HasText(file, kUriKey, savedUri) || !HasText(file, kTimeKey, savedTime)) return false;
+  return savedUri == uri && ParseNumber<int64_t>(savedTime) == modified;
+}
+
+}  // namespace
+
+std::string FileUri(std::string_view path) {
+  std::string uri = "file://";
+  for (const char c : path) {
+    const bool letter = (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || (c >= '0' && c <= '9');
+    if (letter || kAllowedMarks.find(c) != std::string_view::npos) {
+      uri += c;
+      continue;
+    }
+    const auto byte = static_cast<unsigned char>(c);
+    uri += '%';
+    uri += "0123456789ABCDEF"[byte >> 4];
+    uri += "0123456789ABCDEF"[byte & 15];
+  }
+  return uri;
+}
+
+bool ReadSystemThumbnail(const std::string& picturePath, LargeThumbnailRecord& record) {
+  const platform::FileFacts facts = platform::FactsOf(picturePath);
+  if (facts.kind != platform::FileKind::Regular) return false;
+  const std::string uri = FileUri(platform::AbsolutePath(picturePath));
+  const std::string path = CachedFile(uri);
+  platform::FileView file;
+  if (path.empty() || !file.Open(path) || !IsOf(file.Bytes(), uri, facts.modified)) return false;
+  const PicturePointer picture = NewPictureRecord();
+  if (picture == nullptr || DescribePng(file.Bytes(), *picture) != Status::Ok) return false;
+  if (std::max(picture->width, picture->height) > kLongestSide) return false;
+  return DecodePng(file.Bytes(), *picture) == Status::Ok && MakeLargeThumbnailRecord(record, *picture);
+}
+
+}  // namespace fotomill

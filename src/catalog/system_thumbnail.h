@@ -1,0 +1,22 @@
+#pragma once
+
+#include <string>
+#include <string_view>
+
+#include "catalog/thumbnail_record.h"
+
+namespace fotomill {
+
+// The system's own thumbnails, made by file managers and only read here: on free desktops PNG files in the folder
+// "thumbnails/large" of the user's cache, at most 256 pixels wide and high, named after the MD5 of the picture's URI. A
+// text in each names the URI ("Thumb::URI"), another the picture's modification time ("Thumb::MTime"); it is out of
+// date when that is not the picture's. Source: freedesktop.org, "Thumbnail Managing Standard".
+
+// The address of an absolute path, every byte escaped that RFC 2396 does not allow in one.
+std::string FileUri(std::string_view path);
+
+// Fills a large record with the system's thumbnail of a picture. False when there is none that is valid; `record` is
+// then as before.
+bool ReadSystemThumbnail(const std::string& picturePath, LargeThumbnailRecord& record);
+
+}  // namespace fotomill
