@@ -203,7 +203,7 @@ void SetUpExif(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<ExifOptions>();
   AddSelection(app, options->selection, context);
   AddFlag(app, "--json", options->json, "One JSON array, an object for each file");
-  AddText(app, "--thumbnail", options->thumbnail, "OUT", "Write the embedded thumbnail to this file, as it is");
+  AddName(app, "--thumbnail", options->thumbnail, "OUT", "Write the embedded thumbnail to this file, as it is");
   AddChoice(app, "--overwrite", options->overwrite, "HOW", {"refuse", "replace"},
             "When OUT is there: refuse (the default) or replace");
   AddTexts(app, "--distance", options->distance, 2, "LAT,LON LAT,LON",

@@ -30,7 +30,7 @@ CLI::Option* AddNumber(CLI::App& app, const char* names, int32_t& value, const c
 
 CLI::Option* AddTexts(CLI::App& app, const char* names, std::vector<std::string>& values, int count,
                       const char* shownAs, const char* help) {
-  return app.add_option(names, values, help)->option_text(shownAs)->expected(count);
+  return app.add_option(names, values, help)->option_text(shownAs)->expected(count)->allow_extra_args(false);
 }
 
 CLI::Option* AddRepeatedText(CLI::App& app, const char* names, std::vector<std::string>& values, const char* shownAs,

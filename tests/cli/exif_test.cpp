@@ -109,6 +109,7 @@ TEST_F(ExifCommand, ExtractsTheThumbnailWithoutReplacingAnything) {
   EXPECT_EQ(ReadBytes(picture), LittleEndianBlock());
   EXPECT_EQ(Exif({picture, picture, "--thumbnail", folder.Path("other.jpg")}).status, 2);
   EXPECT_EQ(Exif({picture, "--thumbnail", folder.Path("none/other.jpg")}).status, 1);
+  EXPECT_EQ(Exif({picture, "--thumbnail", ""}).status, 2);
   BlockBuilder plain;
   plain.Directory({{0x0100, 3, 1, 1}});
   WriteBytes(picture, plain.block);
@@ -125,6 +126,7 @@ TEST_F(ExifCommand, MeasuresDistances) {
   EXPECT_EQ(Exif({"--set", kilometers, "--distance", "-33.5,-70.25", "-34.5,-70.25"}).out, "111.125 kilometers\n");
   EXPECT_EQ(Exif({"--distance", "-.5,0", "+.5,0"}).out, "69.045 miles\n");
   EXPECT_EQ(Exif({picture, "--distance", "45,9", "46,9"}).out, std::string(kBlockText) + "69.045 miles\n");
+  EXPECT_EQ(Exif({"--distance", "-45,9", "-46,9", picture}).out, std::string(kBlockText) + "69.045 miles\n");
   const auto json = nlohmann::json::parse(Exif({"--json", "--set", kilometers, "--distance", "45,9", "46,9"}).out);
   EXPECT_NEAR(json[0]["distance"], 111.125, 0.001);
   EXPECT_EQ(json[0]["unit"], "kilometers");
