@@ -291,7 +291,7 @@ int64_t ThumbnailDatabase::Delete(const std::string& path) {
 }
 
 ThumbnailDatabase::Compacted ThumbnailDatabase::CopyLiveRecords(platform::StoreFile& to, DatabaseHeader header, bool purge,
-                                                                ProgressSink* progress) {
+                                                                ProgressSink* progress, const std::atomic<bool>* stop) {
   const int32_t count = header.count;
   header.count = 0;
   // The header comes first, so that what an interrupted pass leaves is known as ours by its first bytes.
@@ -300,6 +300,7 @@ ThumbnailDatabase::Compacted ThumbnailDatabase::CopyLiveRecords(platform::StoreF
   for (int32_t i = 0; i < count; ++i) {
     if (progress != nullptr) progress->Step(i, count);
     if (platform::PendingExit() != 0) return Compacted::Failed;
+    if (stop != nullptr && *stop) return Compacted::Stopped;
     if (!file_.ReadAt(OffsetOf(i), bytes) || !ByteReader(bytes).Match(kSmallThumbnailMagic)) return Compacted::NotRead;
     DatabaseKey key;
     TakeKey(std::span<const uint8_t>(bytes).subspan(kPathOffset), key);
@@ -312,13 +313,14 @@ ThumbnailDatabase::Compacted ThumbnailDatabase::CopyLiveRecords(platform::StoreF
   return to.WriteAt(0, BytesOf(header)) && to.Sync() ? Compacted::Done : Compacted::Failed;
 }
 
-ThumbnailDatabase::Compacted ThumbnailDatabase::Compact(bool purge, ProgressSink* progress) {
-  const Compacted result = CompactLocked(purge, progress);
+ThumbnailDatabase::Compacted ThumbnailDatabase::Compact(bool purge, ProgressSink* progress, const std::atomic<bool>* stop) {
+  const Compacted result = CompactLocked(purge, progress, stop);
   if (result == Compacted::Done && Open(path_, false) != Opened::Done) return Compacted::NotRead;
   return result;
 }
 
-ThumbnailDatabase::Compacted ThumbnailDatabase::CompactLocked(bool purge, ProgressSink* progress) {
+ThumbnailDatabase::Compacted ThumbnailDatabase::CompactLocked(bool purge, ProgressSink* progress,
+                                                              const std::atomic<bool>* stop) {
   using platform::StoreFile;
   DatabaseHeader header;
   if (!LockAndCheck(header)) return Compacted::NotRead;
@@ -328,7 +330,7 @@ ThumbnailDatabase::Compacted ThumbnailDatabase::CompactLocked(bool purge, Progre
   if (IsLeftover(copy) && !platform::DeleteFile(copy)) return Compacted::Failed;
   StoreFile to;
   if (to.Open(copy, StoreFile::Mode::CreateNew) != StoreFile::OpenResult::Done) return Compacted::Failed;
-  Compacted result = CopyLiveRecords(to, header, purge, progress);
+  Compacted result = CopyLiveRecords(to, header, purge, progress, stop);
   if (result == Compacted::Done &&
       platform::RenameFile(copy, path_, platform::Existing::Replace) != platform::CommitResult::Done) {
     result = Compacted::Failed;

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <array>
+#include <atomic>
 #include <cstdint>
 #include <span>
 #include <string>
@@ -101,10 +102,11 @@ class ThumbnailDatabase {
     Done,
     NotRead,  // a record cannot be read, or the header counts more than there are
     Failed,   // the new file could not be written
+    Stopped,  // asked to stop
   };
   // Copies what is not deleted (and with `purge`, whose picture is there) into "PATH.BAK", which then takes the database's
   // place in one step. Otherwise the database stays as it was.
-  Compacted Compact(bool purge, ProgressSink* progress = nullptr);
+  Compacted Compact(bool purge, ProgressSink* progress = nullptr, const std::atomic<bool>* stop = nullptr);
 
  private:
   using Index = std::unordered_map<std::string, std::vector<int64_t>>;  // live records of a path and volume, in order
@@ -116,8 +118,9 @@ class ThumbnailDatabase {
   bool UpdateIndex(const DatabaseHeader& header);
   bool WriteHeader(const DatabaseHeader& header);
   bool MarkDeleted(int64_t index);
-  Compacted CompactLocked(bool purge, ProgressSink* progress);
-  Compacted CopyLiveRecords(platform::StoreFile& to, DatabaseHeader header, bool purge, ProgressSink* progress);
+  Compacted CompactLocked(bool purge, ProgressSink* progress, const std::atomic<bool>* stop);
+  Compacted CopyLiveRecords(platform::StoreFile& to, DatabaseHeader header, bool purge, ProgressSink* progress,
+                            const std::atomic<bool>* stop);
 
   std::string path_;
   platform::StoreFile file_;

@@ -4,6 +4,7 @@
 
 #include "core/configuration.h"
 #include "core/data_folder.h"
+#include "picture/format_switches.h"
 #include "picture/registry.h"
 #include "plugins/plugin_table.h"
 
@@ -19,6 +20,7 @@ std::string PrepareFor(const Command& command, const GlobalOptions& global) {
     const SetResult result = SetSetting(setting.substr(0, equals), setting.substr(equals + 1));
     if (!result.Ok()) return "--set: " + result.message;
   }
+  if (command.needs == Needs::Formats) TakeFormatSwitches();
   if (command.needs == Needs::Formats) RunFormatStartup();
   if (command.needs == Needs::Formats && !global.noPlugins) EnablePlugins();
   return {};

@@ -5,7 +5,6 @@
 #include "core/data_folder.h"
 #include "core/file_edit.h"
 #include "core/fixed_text.h"
-#include "core/ini_file.h"
 #include "core/limits.h"
 #include "core/settings.h"
 #include "platform/files.h"
@@ -70,7 +69,7 @@ ConfigurationState ReadConfigurationText(std::string& text) {
 }
 
 // Makes the changes in the file, and in what this run knows of it.
-SaveResult WriteEdits(std::span<const IniEdit> edits) {
+SaveResult WriteEdits(std::span<const IniEdit> edits, std::string_view section = kConfigurationSection) {
   Configuration& configuration = TheConfiguration();
   const std::string path = ConfigurationPath();
   if (path.empty()) return SaveResult::NoFolder;
@@ -78,11 +77,11 @@ SaveResult WriteEdits(std::span<const IniEdit> edits) {
   bool wide = false;
   const EditResult result = EditTextFile(path, limits.listFileBytes, [&](std::string& text) {
     wide = IsWideText(text);
-    if (!wide) text = EditIni(text, kConfigurationSection, edits);
+    if (!wide) text = EditIni(text, section, edits);
   });
   if (wide || result == EditResult::NotRead) return SaveResult::Unreadable;
   if (result == EditResult::Failed) return SaveResult::Failed;
-  configuration.text = EditIni(configuration.text, kConfigurationSection, edits);
+  configuration.text = EditIni(configuration.text, section, edits);
   return result == EditResult::Done ? SaveResult::Done : SaveResult::Unchanged;
 }
 
@@ -170,6 +169,10 @@ SaveResult RemoveSetting(const KeyRow& row) {
   KeepSetting(row);
   return result;
 }
+
+std::string_view ConfigurationText() { return TheConfiguration().text; }
+
+SaveResult StoreInSection(std::string_view section, std::span<const IniEdit> edits) { return WriteEdits(edits, section); }
 
 bool IsForThisRun(const KeyRow& row) { return TheConfiguration().forThisRun[NumberOfKey(row)]; }
 

@@ -8,6 +8,7 @@
 #include <string_view>
 #include <vector>
 
+#include "core/ini_file.h"
 #include "core/setting_value.h"
 
 namespace fotomill {
@@ -74,6 +75,10 @@ SaveResult StoreSetting(const KeyRow& row, const SettingValue& value);
 SaveResult RemoveSetting(const KeyRow& row);
 // Whether a key has its value from SetSetting.
 bool IsForThisRun(const KeyRow& row);
+// The configuration file's text as this run knows it: as loaded, with this run's own changes. Valid until the next one.
+std::string_view ConfigurationText();
+// Makes changes to another section of the configuration file.
+SaveResult StoreInSection(std::string_view section, std::span<const IniEdit> edits);
 // From here on a value given by SetSetting counts like one that the user chose in a dialog, and is saved.
 void KeepSetting(const KeyRow& row);
 

@@ -34,13 +34,23 @@ int32_t PositionOf(const KeyRow& row, int32_t number) {
   return byDefault >= 0 ? byDefault : last - 1;
 }
 
-void FillDestinations(SetupDialog& dialog, const DestinationExtensions& destinations, const KeyRow& row) {
+int32_t NumberOf(const KeyRow& row, SetupValues values) {
+  return values == SetupValues::Default ? DefaultNumber(row) : NumberIn(row);
+}
+
+std::string_view TextOf(const KeyRow& row, SetupValues values) {
+  return values == SetupValues::Default ? DefaultText(row) : TextIn(row);
+}
+
+int32_t DestinationPosition(std::span<const std::string> extensions, std::string_view wanted) {
+  const auto found = std::ranges::find_if(extensions, [&](const std::string& one) { return EqualIgnoringCase(one, wanted); });
+  return found == extensions.end() ? -1 : static_cast<int32_t>(found - extensions.begin());
+}
+
+void FillDestinations(SetupDialog& dialog, const DestinationExtensions& destinations, const KeyRow& row, SetupValues values) {
   const std::vector<std::string> extensions = destinations.Extensions();
   dialog.SetChoices(row.control, extensions);
-  const auto found = std::ranges::find_if(extensions, [&](const std::string& extension) {
-    return EqualIgnoringCase(extension, TextIn(row));
-  });
-  dialog.Select(row.control, found == extensions.end() ? -1 : static_cast<int32_t>(found - extensions.begin()));
+  dialog.Select(row.control, DestinationPosition(extensions, TextOf(row, values)));
 }
 
 // What the dialog itself says of a spin control's range counts.
@@ -50,22 +60,22 @@ SpinRange RangeIn(const SetupDialog& dialog, const KeyRow& row) {
   return range ? *range : SpinRangeOf(row);
 }
 
-void FillControl(SetupDialog& dialog, const DestinationExtensions& destinations, const KeyRow& row) {
+void FillControl(SetupDialog& dialog, const DestinationExtensions& destinations, const KeyRow& row, SetupValues values) {
   if ((row.type & KEY_FLAG) != 0) {
-    dialog.SetChecked(row.control, NumberIn(row) != 0);
+    dialog.SetChecked(row.control, NumberOf(row, values) != 0);
   } else if ((row.type & KEY_DESTINATION) != 0) {
-    FillDestinations(dialog, destinations, row);
+    FillDestinations(dialog, destinations, row, values);
   } else if ((row.type & KEY_TEXT) != 0) {
     dialog.LimitText(row.control, TextLimit(row));
-    if ((row.type & KEY_FILLED_TEXT) == 0) dialog.SetText(row.control, TextIn(row));
+    if ((row.type & KEY_FILLED_TEXT) == 0) dialog.SetText(row.control, TextOf(row, values));
   } else if ((row.type & KEY_CHOICE) != 0) {
     dialog.SetChoices(row.control, ChoiceTexts(row));
-    dialog.Select(row.control, PositionOf(row, NumberIn(row)));
+    dialog.Select(row.control, PositionOf(row, NumberOf(row, values)));
   } else if ((row.type & KEY_COLOUR) != 0) {
-    dialog.SetColour(row.control, NumberIn(row));
+    dialog.SetColour(row.control, NumberOf(row, values));
   } else {
     if ((row.type & KEY_SPIN) != 0) dialog.SetRange(row.control, RangeIn(dialog, row));
-    dialog.SetText(row.control, std::to_string(NumberIn(row)));
+    dialog.SetText(row.control, std::to_string(NumberOf(row, values)));
   }
 }
 
@@ -122,10 +132,21 @@ ControlValue ReadControl(const SetupDialog& dialog, const DestinationExtensions&
 
 }  // namespace
 
-void FillSetupDialog(SetupDialog& dialog, const DestinationExtensions& destinations, std::span<const KeyRow> rows) {
+void FillSetupDialog(SetupDialog& dialog, const DestinationExtensions& destinations, std::span<const KeyRow> rows,
+                     SetupValues values) {
   for (const KeyRow& row : rows) {
-    if (row.control != 0 && dialog.Has(row.control)) FillControl(dialog, destinations, row);
+    if (row.control != 0 && dialog.Has(row.control)) FillControl(dialog, destinations, row, values);
   }
+}
+
+bool ShowsDefault(const SetupDialog& dialog, const DestinationExtensions& destinations, const KeyRow& row) {
+  if ((row.type & KEY_FLAG) != 0) return dialog.IsChecked(row.control) == (DefaultNumber(row) != 0);
+  if ((row.type & KEY_DESTINATION) != 0) {
+    return dialog.Selected(row.control) == DestinationPosition(destinations.Extensions(), DefaultText(row));
+  }
+  if ((row.type & KEY_CHOICE) != 0) return dialog.Selected(row.control) == PositionOf(row, DefaultNumber(row));
+  if ((row.type & KEY_COLOUR) != 0) return dialog.Colour(row.control) == DefaultNumber(row);
+  return dialog.Text(row.control) == DefaultValueText(row);
 }
 
 std::optional<SetupFault> ReadSetupDialog(const SetupDialog& dialog, const DestinationExtensions& destinations,

@@ -41,9 +41,14 @@ class DestinationExtensions {
   virtual std::vector<std::string> Extensions() const = 0;
 };
 
-// Fills every control of the dialog that edits a key with the key's value, its limit, range or choices.
-void FillSetupDialog(SetupDialog& dialog, const DestinationExtensions& destinations,
-                     std::span<const KeyRow> rows = Keys());
+enum class SetupValues { InForce, Default };
+
+// Fills every control of the dialog that edits a key with the key's value, its limit, range or choices. With the defaults
+// no key changes until ReadSetupDialog takes them up.
+void FillSetupDialog(SetupDialog& dialog, const DestinationExtensions& destinations, std::span<const KeyRow> rows = Keys(),
+                     SetupValues values = SetupValues::InForce);
+// Whether the control of a row shows what it would show for the row's default.
+bool ShowsDefault(const SetupDialog& dialog, const DestinationExtensions& destinations, const KeyRow& row);
 
 // A control whose value cannot be taken.
 struct SetupFault {

@@ -254,6 +254,8 @@ bool RowMatches(std::string_view rowExtension, std::string_view extension) {
 
 FormatEntry& FormatRow(int32_t index) { return index == kSpareRow ? spareRow : formatRows[static_cast<size_t>(index)]; }
 
+int32_t EnabledByDefault(int32_t index) { return index == kSpareRow ? 0 : kBuiltInRows[index].enabled; }
+
 int32_t FindFormatByName(std::string_view fileName, int32_t parameter) {
   const std::string_view extension = platform::ExtensionOf(fileName);
   for (int32_t i = 0; i < formatCount && !extension.empty(); ++i) {

@@ -70,6 +70,8 @@ inline constexpr int32_t formatCount = 78;
 // Row `index` of the registry; the rows live as long as the program. Only `enabled`, `options` and the spare row change.
 // Every thread has a spare row of its own, so that files of different plug-in formats can be in work at once.
 FormatEntry& FormatRow(int32_t index);
+// The built-in state of a row's switch `enabled`.
+int32_t EnabledByDefault(int32_t index);
 
 // The row that a file name selects by its extension, or kNoFormat. The first row wins whose extension equals the
 // name's, or whose first three characters equal the first three of the name's, ignoring case; spare rows are skipped, as

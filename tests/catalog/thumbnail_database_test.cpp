@@ -88,6 +88,9 @@ TEST_F(Database, IsLaidOutToTheByte) {
   EXPECT_EQ(part(60 + 28434, 8), std::string(8, '\0'));
   EXPECT_EQ(database.Delete("/a"), 1);
   EXPECT_EQ(ReadBytes(Path())[60 + 28434], 1);
+  const std::atomic<bool> stop = true;
+  EXPECT_EQ(database.Compact(false, nullptr, &stop), Compacted::Stopped);
+  EXPECT_EQ(Size(), 28502u);
   EXPECT_EQ(database.Compact(false), Compacted::Done);
   EXPECT_EQ(Size(), 60u);
   EXPECT_THAT(folder_.Names(), ElementsAre("Fotomill.tdb"));

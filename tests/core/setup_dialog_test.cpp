@@ -215,6 +215,23 @@ TEST_F(SetupDialogTest, MarkTellsThatWindowsHaveToFollow) {
   EXPECT_TRUE(TakeSetupChanged());
 }
 
+TEST_F(SetupDialogTest, MarksWhatIsNotTheDefaultAndPutsTheDefaultBack) {
+  const KeyNumber keys[] = {WriteOS2Bitmaps, FileTipDelay, PrefixCrop, JpegCompression, AlphaBackground, JpegProcessor, DefaultFileExtension};
+  settings.WriteOS2Bitmaps = settings.JpegProcessor = settings.AlphaBackground = settings.FileTipDelay = 0;
+  settings.JpegCompression = 10;
+  settings.PrefixCrop = std::string_view("x");
+  settings.DefaultFileExtension = std::string_view("TIF");
+  FakeDialog& dialog = Filled({WriteOS2Bitmaps, FileTipDelay, PrefixCrop, JpegCompression, AlphaBackground, JpegProcessor, DefaultFileExtension});
+  for (const KeyNumber key : keys) EXPECT_EQ(ShowsDefault(dialog, formats_, KeyOf(key)), key == WriteOS2Bitmaps) << KeyOf(key).name;
+  FillSetupDialog(dialog, formats_, Keys(), SetupValues::Default);
+  for (const KeyNumber key : keys) EXPECT_TRUE(ShowsDefault(dialog, formats_, KeyOf(key))) << KeyOf(key).name;
+  EXPECT_EQ(settings.JpegCompression, 10) << "nothing changes before OK";
+  ASSERT_FALSE(Read());
+  EXPECT_EQ(settings.PrefixCrop.view(), "Cropped_ ");
+  EXPECT_EQ(settings.FileTipDelay, 500);
+  EXPECT_EQ(settings.DefaultFileExtension.view(), "png");
+}
+
 TEST_F(SetupDialogTest, HelpIsByKey) {
   EXPECT_EQ(HelpPageFor(KeyOf(JpegCompression).control), "JpegCompression");
   EXPECT_EQ(HelpPageFor(0), kGeneralHelpPage);

@@ -22,7 +22,7 @@ FLOORS = [
     ["cli", "desktop"],
 ]
 FLOOR = {room: floor for floor, rooms in enumerate(FLOORS) for room in rooms}
-REGISTRY_FILES = {"registry", "load_picture", "write_picture"}
+REGISTRY_FILES = {"registry", "load_picture", "write_picture", "format_switches"}
 
 # What only the folder of one system may include or ask for. Files are read and written through src/platform.
 # What a plug-in author includes stands alone, so it may ask which system it is compiled for.
