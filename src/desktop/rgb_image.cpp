@@ -1,0 +1,91 @@
+#include "desktop/rgb_image.h"
+
+#include <algorithm>
+#include <cstring>
+#include <new>
+
+#include "core/settings.h"
+#include "metadata/picture_exif.h"
+#include "processing/flatten.h"
+#include "processing/promote.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+void SwapRow(const uint8_t* bgr, int32_t width, uint8_t* rgb) {
+  for (int32_t x = 0; x < width; ++x, bgr += 3, rgb += 3) {
+    rgb[0] = bgr[2];
+    rgb[1] = bgr[1];
+    rgb[2] = bgr[0];
+  }
+}
+
+bool Reserve(RgbImage& image, int32_t width, int32_t height) {
+  try {
+    image.bytes.resize(static_cast<size_t>(width) * static_cast<size_t>(height) * 3);
+  } catch (const std::bad_alloc&) {
+    image = {};
+    return false;
+  }
+  image.width = width;
+  image.height = height;
+  return true;
+}
+
+bool RowIs(const RgbImage& image, int32_t y, const uint8_t* color) {
+  const uint8_t* pixel = image.Row(y);
+  for (int32_t x = 0; x < image.width; ++x, pixel += 3) {
+    if (std::memcmp(pixel, color, 3) != 0) return false;
+  }
+  return true;
+}
+
+bool ColumnIs(const RgbImage& image, int32_t x, const uint8_t* color) {
+  for (int32_t y = 0; y < image.height; ++y) {
+    if (std::memcmp(image.Row(y) + 3 * x, color, 3) != 0) return false;
+  }
+  return true;
+}
+
+}  // namespace
+
+RgbImage FilledImage(int32_t width, int32_t height, Color color) {
+  RgbImage image;
+  if (!Reserve(image, width, height)) return image;
+  for (size_t i = 0; i < image.bytes.size(); ++i) image.bytes[i] = static_cast<uint8_t>(color >> (8 * (i % 3)));
+  return image;
+}
+
+Status ToRgb(const PackedImage& image, RgbImage& rgb) {
+  BgrRows rows;
+  RETURN_IF_BAD(rows.Open(image));
+  if (!Reserve(rgb, image.Width(), image.Height())) return Status::MemoryAllocationError;
+  for (int32_t y = 0; y < rgb.height; ++y) SwapRow(rows.Row(y), rgb.width, rgb.Row(y));
+  return Status::Ok;
+}
+
+Status PrepareForDisplay(PictureRecord& picture, Color background) {
+  if (picture.image.Empty()) return Status::EmptyImage;
+  if (settings.ExifAdjustOrientation != 0) RETURN_IF_BAD(TurnUpright(picture));
+  picture.defaultColour = background;
+  picture.alphaFlags &= static_cast<uint8_t>(~kFlattenOnBackground);
+  RETURN_IF_BAD(FlattenAlpha(picture));
+  return PromotePicture(picture);
+}
+
+RgbImage WithoutMatte(const RgbImage& image, Color matte) {
+  const uint8_t color[3] = {static_cast<uint8_t>(matte), static_cast<uint8_t>(matte >> 8), static_cast<uint8_t>(matte >> 16)};
+  int32_t top = 0, left = 0;
+  // The two sides of a margin differ by one pixel at most, since the picture stands in the middle.
+  while (2 * (top + 1) < image.height && RowIs(image, top, color) && RowIs(image, image.height - 1 - top, color)) ++top;
+  while (2 * (left + 1) < image.width && ColumnIs(image, left, color) && ColumnIs(image, image.width - 1 - left, color)) ++left;
+  RgbImage cut;
+  if (!Reserve(cut, image.width - 2 * left, image.height - 2 * top)) return cut;
+  for (int32_t y = 0; y < cut.height; ++y) {
+    std::memcpy(cut.Row(y), image.Row(y + top) + 3 * left, static_cast<size_t>(cut.width) * 3);
+  }
+  return cut;
+}
+
+}  // namespace fotomill::desktop

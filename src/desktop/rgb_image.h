@@ -1,0 +1,36 @@
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <vector>
+
+#include "core/status.h"
+#include "picture/packed_image.h"
+#include "picture/picture_record.h"
+
+namespace fotomill::desktop {
+
+// Pixels as windows draw them: red, green, blue, top row first, no padding. Made off the window's thread.
+struct RgbImage {
+  int32_t width = 0, height = 0;
+  std::vector<uint8_t> bytes;
+
+  bool Empty() const { return bytes.empty(); }
+  uint8_t* Row(int32_t y) { return bytes.data() + static_cast<size_t>(y) * static_cast<size_t>(width) * 3; }
+  const uint8_t* Row(int32_t y) const { return bytes.data() + static_cast<size_t>(y) * static_cast<size_t>(width) * 3; }
+};
+
+// An image of `width` by `height` in one colour, 0x00BBGGRR.
+RgbImage FilledImage(int32_t width, int32_t height, Color color);
+
+// The pixels of a packed image of any depth. Statuses as NewPackedImage.
+Status ToRgb(const PackedImage& image, RgbImage& rgb);
+
+// Turns a picture upright by its EXIF orientation, if ExifAdjustOrientation asks for it, composites its alpha plane onto
+// `background` (0x00BBGGRR) and brings it to 24 bits: what a window can show. Statuses of those steps.
+Status PrepareForDisplay(PictureRecord& picture, Color background);
+
+// The picture of a thumbnail without the even margins of a colour around it, and at least a pixel of it.
+RgbImage WithoutMatte(const RgbImage& image, Color matte);
+
+}  // namespace fotomill::desktop

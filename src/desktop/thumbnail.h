@@ -1,0 +1,40 @@
+#pragma once
+
+#include <cstdint>
+#include <memory>
+#include <string>
+
+#include "core/status.h"
+#include "desktop/rgb_image.h"
+
+namespace fotomill::desktop {
+
+// What a thumbnail is wanted for. The file's time and size are part of it: a changed file is another one.
+struct ThumbnailWish {
+  std::string path;
+  int64_t modified = 0;
+  uint64_t size = 0;
+  int32_t side = 96;  // pixels of the square that it must fit
+  int32_t mode = 0;   // choice::ThumbnailMode: where records may be
+
+  bool operator==(const ThumbnailWish&) const = default;
+};
+
+struct Thumbnail {
+  Status status = Status::Ok;  // why there are no pixels
+  RgbImage pixels;             // never larger than the square, nor enlarged
+  int32_t width = 0, height = 0, bits = 0, pages = 1;  // of the picture, 0 when it was not opened
+  bool alpha = false;
+
+  uint64_t Bytes() const { return sizeof *this + pixels.bytes.size(); }
+};
+using ThumbnailPointer = std::shared_ptr<const Thumbnail>;
+
+// Gets a picture's thumbnail: a record from its thumbnail file or the database of the browser's mode when that is as new as the
+// picture and large enough, else from the picture itself. Takes as long as it takes; called by workers.
+ThumbnailPointer LoadThumbnail(const ThumbnailWish& wish);
+
+// Makes a picture's thumbnail record and writes its thumbnail file.
+Status WriteThumbnail(const std::string& path);
+
+}  // namespace fotomill::desktop

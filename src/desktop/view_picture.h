@@ -1,0 +1,108 @@
+#pragma once
+
+#include <condition_variable>
+#include <functional>
+#include <memory>
+#include <mutex>
+#include <string>
+#include <thread>
+#include <vector>
+
+#include "core/status.h"
+#include "desktop/rgb_image.h"
+#include "desktop/view_transform.h"
+#include "picture/picture_record.h"
+
+namespace fotomill::desktop {
+
+// A picture as a view window wants it: a page of a file, with the size of the window that it is to fit.
+struct ViewWish {
+  std::string path;
+  int32_t page = 0;
+  int32_t fitWidth = 0, fitHeight = 0;  // device pixels, 0 for none
+
+  bool SamePicture(const ViewWish& other) const { return path == other.path && page == other.page; }
+};
+
+// A decoded picture: upright, 24 bits, without alpha.
+struct ViewPicture {
+  ViewWish wish;
+  Status status = Status::Ok;
+  PicturePointer picture;  // null unless Ok
+  PackedImage fitted;      // as large as the fit of the wish's window; empty where that is the picture's own size or more
+  double seconds = 0;      // that decoding took
+
+  uint64_t Bytes() const;
+};
+using ViewPicturePointer = std::shared_ptr<const ViewPicture>;
+
+ViewPicturePointer LoadViewPicture(const ViewWish& wish);
+
+// Decodes pictures ahead on a thread of its own, and keeps those that are wanted up to a number of bytes.
+class ViewLoader {
+ public:
+  // `wake` is called on the loader's thread whenever a wanted picture is there.
+  ViewLoader(uint64_t capacity, std::function<void()> wake);
+  ~ViewLoader();
+  ViewLoader(const ViewLoader&) = delete;
+  ViewLoader& operator=(const ViewLoader&) = delete;
+
+  // What is wanted from here on, most urgent first. Pictures that are not among these are given back; what does not fit
+  // into the capacity beside more urgent ones is not decoded, the first one always is.
+  void Want(std::vector<ViewWish> wishes);
+  // The picture of a wish if it is there, whatever window it was fitted to.
+  ViewPicturePointer Find(const ViewWish& wish) const;
+  // Forgets a picture whose file has changed.
+  void Forget(const std::string& path);
+
+ private:
+  void Work();
+  bool NextWish(ViewWish& wish);
+  void DropUnwanted();
+
+  const uint64_t capacity_;
+  const std::function<void()> wake_;
+  mutable std::mutex mutex_;
+  std::condition_variable wanted_;
+  std::vector<ViewWish> wishes_;
+  std::vector<ViewPicturePointer> pictures_;
+  bool full_ = false;
+  bool stop_ = false;
+  std::thread worker_;
+};
+
+// Scales pictures on a thread of its own; only the latest request counts.
+class ViewScaler {
+ public:
+  explicit ViewScaler(std::function<void()> wake);
+  ~ViewScaler();
+  ViewScaler(const ViewScaler&) = delete;
+  ViewScaler& operator=(const ViewScaler&) = delete;
+
+  void Request(ViewPicturePointer picture, int32_t width, int32_t height);
+  struct Scaled {
+    ViewPicturePointer picture;
+    PackedImage image;
+  };
+  // What was finished since the last call, null if nothing.
+  std::unique_ptr<Scaled> Take();
+
+ private:
+  void Work();
+
+  const std::function<void()> wake_;
+  std::mutex mutex_;
+  std::condition_variable requested_;
+  ViewPicturePointer request_;
+  int32_t width_ = 0, height_ = 0;
+  std::unique_ptr<Scaled> finished_;
+  bool stop_ = false;
+  std::thread worker_;
+};
+
+// Draws what a window shows of a picture into `canvas`, whose size is the window's in device pixels: `source`, the picture
+// at any size, in the place that `transform` gives it, the rest in `background`. A source of just the shown size is copied;
+// others are sampled at the nearest pixel, or with `smooth` between pixels.
+void DrawView(const PackedImage& source, const ViewTransform& transform, Color background, bool smooth, RgbImage& canvas);
+
+}  // namespace fotomill::desktop

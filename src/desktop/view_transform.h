@@ -1,0 +1,49 @@
+#pragma once
+
+#include <cstdint>
+
+namespace fotomill::desktop {
+
+enum class ZoomMode { Fit, FitWidth, Fill, Free };
+
+// Where a picture lies in a view window and how large: pure arithmetic in device pixels. A scale of 1 shows each pixel of
+// the picture as one pixel of the screen.
+class ViewTransform {
+ public:
+  static constexpr double kStep = 1.25;  // of zooming in and out
+  static constexpr double kSmallest = 0.01, kLargest = 64;
+
+  void SetPicture(int32_t width, int32_t height);
+  void SetWindow(int32_t width, int32_t height);
+  void SetMode(ZoomMode mode);
+  // What the key DefaultViewZoom stands for (choice::ViewZoom).
+  void SetModeFromKey(int32_t zoom);
+  // A scale of its own; the picture's point at x, y of the window stays there.
+  void ZoomTo(double scale, double x, double y);
+  void ZoomBy(double factor, double x, double y) { ZoomTo(scale_ * factor, x, y); }
+  // To the scale in the middle of the window.
+  void ZoomToMiddle(double scale) { ZoomTo(scale, windowWidth_ / 2.0, windowHeight_ / 2.0); }
+  void Pan(double dx, double dy);
+
+  ZoomMode Mode() const { return mode_; }
+  double Scale() const { return scale_; }
+  // Size on the screen, at least a pixel.
+  int32_t ShownWidth() const;
+  int32_t ShownHeight() const;
+  // Of the picture's top left corner; negative when it lies outside.
+  int32_t X() const;
+  int32_t Y() const;
+  bool CanPan() const { return ShownWidth() > windowWidth_ || ShownHeight() > windowHeight_; }
+
+ private:
+  void Update();
+  void KeepInside();
+
+  int32_t pictureWidth_ = 1, pictureHeight_ = 1;
+  int32_t windowWidth_ = 1, windowHeight_ = 1;
+  ZoomMode mode_ = ZoomMode::Fit;
+  double scale_ = 1;
+  double x_ = 0, y_ = 0;
+};
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,362 @@
+#include "desktop/windows/browser_page.h"
+
+#include <wx/bmpbuttn.h>
+#include <wx/dnd.h>
+#include <wx/dataobj.h>
+#include <wx/filename.h>
+#include <wx/simplebook.h>
+#include <wx/sizer.h>
+#include <wx/srchctrl.h>
+#include <wx/textctrl.h>
+
+#include <algorithm>
+
+#include "core/choice_lists.h"
+#include "core/settings.h"
+#include "desktop/event_log.h"
+#include "desktop/windows/bitmaps.h"
+#include "desktop/windows/details_list.h"
+#include "desktop/windows/thumbnail_canvas.h"
+#include "desktop/windows/wx_text.h"
+#include "platform/files.h"
+#include "platform/folders.h"
+#include "platform/paths.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+constexpr int kGatherMs = 300;  // changes of a folder are gathered for so long
+constexpr size_t kMostHistory = 100;
+
+// Files dropped on a browser go into its folder.
+class FolderDrop : public wxFileDropTarget {
+ public:
+  FolderDrop(BrowserPage& page, BrowserHost& host) : page_(page), host_(host) {}
+  wxDragResult OnDragOver(wxCoord, wxCoord, wxDragResult suggested) override { return last_ = suggested; }
+  bool OnDropFiles(wxCoord, wxCoord, const wxArrayString& names) override {
+    std::vector<std::string> files;
+    for (const wxString& name : names) files.push_back(Utf8(name));
+    const std::string folder = page_.Model().Folder();
+    const bool own = !files.empty() && platform::SplitPath(files[0]).folder == platform::JoinFolder(folder, "");
+    if (own) return false;
+    const bool move = last_ == wxDragMove;
+    page_.CallAfter([host = &host_, files, folder, move] { host->DropFiles(files, folder, move); });
+    return true;
+  }
+
+ private:
+  BrowserPage& page_;
+  BrowserHost& host_;
+  wxDragResult last_ = wxDragCopy;
+};
+
+}  // namespace
+
+BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& thumbnails, const BrowserModes& modes)
+    : wxPanel(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTAB_TRAVERSAL | wxBORDER_NONE, "Browser"),
+      host_(host),
+      thumbnails_(thumbnails),
+      reloadTimer_(this) {
+  model_.SetModes(modes);
+  BuildPathBar();
+  views_ = new wxSimplebook(this);
+  const auto selected = [this] { host_.BrowserChanged(); };
+  const auto menu = [this](wxWindow& window, size_t line, const wxPoint& place) {
+    host_.ShowContextMenu(window, place, line != kNoLine);
+  };
+  ThumbnailCanvas::Events events;
+  events.selectionChanged = selected;
+  events.activated = [this](size_t line) { Activate(line); };
+  events.contextMenu = [this, menu](size_t line, const wxPoint& place) { menu(*canvas_, line, place); };
+  events.dragBegins = [this] { BeginDrag(); };
+  events.resize = [this](int steps) { ChangeSize(steps); };
+  events.renamed = [this](size_t line, const std::string& name) { host_.RenameFile(model_.PathOfLine(line), name); };
+  canvas_ = new ThumbnailCanvas(views_, model_, thumbnails_, events);
+  views_->AddPage(canvas_, "Thumbnails");
+  auto* sizer = new wxBoxSizer(wxVERTICAL);
+  auto* bar = new wxBoxSizer(wxHORIZONTAL);
+  const int gap = FromDIP(4);
+  const auto button = [&](const char* symbol, const char* tip, auto run) {
+    auto* made = new wxBitmapButton(this, wxID_ANY, Symbol(symbol), wxDefaultPosition, wxDefaultSize, wxBORDER_NONE,
+                                    wxDefaultValidator, tip);
+    made->SetToolTip(tip);
+    made->Bind(wxEVT_BUTTON, [run](wxCommandEvent&) { run(); });
+    bar->Add(made, wxSizerFlags().CenterVertical().Border(wxLEFT, gap));
+    return made;
+  };
+  back_ = button("back", "Back", [this] { GoBack(); });
+  forward_ = button("forward", "Forward", [this] { GoForward(); });
+  button("up", "Parent folder", [this] { GoUp(); });
+  bar->Add(path_, wxSizerFlags(1).CenterVertical().Border(wxALL, gap));
+  bar->Add(filter_, wxSizerFlags().CenterVertical().Border(wxRIGHT, gap));
+  sizer->Add(bar, wxSizerFlags().Expand());
+  sizer->Add(views_, wxSizerFlags(1).Expand());
+  SetSizer(sizer);
+  SetDropTarget(new FolderDrop(*this, host_));
+  Bind(wxEVT_TIMER, [this](wxTimerEvent&) { Reload(); });
+  Bind(wxEVT_FSWATCHER, [this](wxFileSystemWatcherEvent& event) {
+    constexpr int kNoChange = wxFSW_EVENT_ACCESS | wxFSW_EVENT_WARNING | wxFSW_EVENT_ERROR;
+    if ((event.GetChangeType() & kNoChange) == 0 && !reloadTimer_.IsRunning()) reloadTimer_.StartOnce(kGatherMs);
+  });
+}
+
+BrowserPage::~BrowserPage() { StopListing(); }
+
+void BrowserPage::BuildPathBar() {
+  path_ = new wxTextCtrl(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxTE_PROCESS_ENTER, wxDefaultValidator, "Folder");
+  path_->AutoCompleteDirectories();
+  path_->Bind(wxEVT_TEXT_ENTER, [this](wxCommandEvent&) {
+    std::string folder = Utf8(path_->GetValue());
+    if (folder.starts_with('~')) folder.replace(0, 1, Utf8(wxGetHomeDir()));
+    folder = platform::AbsolutePath(folder);
+    if (!platform::IsFolder(folder)) return wxBell();
+    Open(folder);
+    FocusList();
+  });
+  const auto leave = [this](wxKeyEvent& event) {
+    if (event.GetKeyCode() != WXK_ESCAPE) return event.Skip();
+    path_->ChangeValue(Shown(model_.Folder()));
+    if (!filter_->IsEmpty()) filter_->Clear();
+    FocusList();
+  };
+  path_->Bind(wxEVT_KEY_DOWN, leave);
+  filter_ = new wxSearchCtrl(this, wxID_ANY, "", wxDefaultPosition, FromDIP(wxSize(200, -1)), wxTE_PROCESS_ENTER, wxDefaultValidator,
+                             "Filter");
+  filter_->SetDescriptiveText("Filter");
+  filter_->ShowCancelButton(true);
+  filter_->SetToolTip("Shows only files whose names contain this, or match its * and ?");
+  filter_->Bind(wxEVT_TEXT, [this](wxCommandEvent&) { ApplyFilter(); });
+  filter_->Bind(wxEVT_SEARCHCTRL_CANCEL_BTN, [this](wxCommandEvent&) { filter_->Clear(); });
+  filter_->Bind(wxEVT_TEXT_ENTER, [this](wxCommandEvent&) { FocusList(); });
+  filter_->Bind(wxEVT_CHAR_HOOK, leave);
+}
+
+// --- folders ---
+
+void BrowserPage::Open(const std::string& folder, const std::string& focus, bool fromHistory) {
+  const bool same = folder == model_.Folder();
+  wantedFocus_ = focus;
+  if (same) return Reload();
+  if (!fromHistory) {
+    if (!history_.empty()) history_.resize(historyPlace_ + 1);
+    history_.push_back(folder);
+    if (history_.size() > kMostHistory) history_.erase(history_.begin());
+    historyPlace_ = history_.size() - 1;
+  }
+  model_.SetFolder(folder);
+  model_.SetModes(ModesForFolder(folder, model_.Modes()));
+  filter_->ChangeValue("");
+  path_->ChangeValue(Shown(folder));
+  canvas_->ScrollTo(0);
+  ShowView();
+  StartListing();
+  watcher_.reset();
+  host_.BrowserChanged();
+}
+
+void BrowserPage::Reload() { StartListing(); }
+
+void BrowserPage::GoBack() {
+  if (!CanGoBack()) return;
+  const std::string child(platform::FileNameOf(model_.Folder()));
+  Open(history_[--historyPlace_], child, true);
+}
+
+void BrowserPage::GoForward() {
+  if (CanGoForward()) Open(history_[++historyPlace_], {}, true);
+}
+
+void BrowserPage::GoUp() {
+  const std::string parent = platform::AbsolutePath(platform::JoinFolder(model_.Folder(), ".."));
+  if (parent != model_.Folder()) Open(parent, std::string(platform::FileNameOf(model_.Folder())));
+}
+
+void BrowserPage::StopListing() {
+  if (job_ != nullptr) job_->stop = true;
+  job_.reset();
+}
+
+// Names come first, then sizes and times, so that even a folder of 100,000 files appears at once. The thread is not waited
+// for, since a folder may hang; what it finds when nobody waits any more is dropped.
+void BrowserPage::StartListing() {
+  StopListing();
+  listing_ = true;
+  job_ = std::make_shared<Job>();
+  const auto tell = [this, weak = std::weak_ptr(job_)](FolderListing listing, bool complete) {
+    wxTheApp->CallAfter([this, weak, listing = std::move(listing), complete]() mutable {
+      if (weak.lock() != nullptr) TakeListing(std::move(listing), complete);
+    });
+  };
+  std::thread([tell, job = job_, folder = model_.Folder(), early = model_.ItemCount() == 0] {
+    FolderListing listing = ListForBrowser(folder, false, job->stop);
+    if (early && !job->stop) tell(listing, false);
+    AddFacts(folder, listing, job->stop);
+    if (!job->stop) tell(std::move(listing), true);
+  }).detach();
+}
+
+void BrowserPage::TakeListing(FolderListing listing, bool complete) {
+  const size_t count = listing.items.size();
+  model_.SetItems(std::move(listing.items));
+  listing_ = !complete;
+  LogEvent(complete ? "listed" : "names", std::to_string(count) + " " + model_.Folder());
+  if (!wantedFocus_.empty()) {
+    const size_t line = model_.FindLine(wantedFocus_);
+    if (line != kNoLine) model_.Selected().SelectOnly(line);
+  }
+  if (model_.Selected().Focus() == kNoLine && model_.LineCount() > 0) model_.Selected().MoveFocus(0, false, true);
+  if (views_->GetSelection() == 1) {
+    details_->ModelChanged();
+  } else {
+    canvas_->ModelChanged();
+    if (wantedScroll_ >= 0) canvas_->ScrollTo(wantedScroll_);
+    if (!wantedFocus_.empty()) canvas_->ShowLine(model_.Selected().Focus());
+  }
+  if (complete) {
+    Watch();
+    wantedFocus_.clear();
+    wantedScroll_ = -1;
+  }
+  host_.BrowserChanged();
+}
+
+// Tells of changes in the folder; many at once are one. Only works once the program waits for events.
+void BrowserPage::Watch() {
+  if (settings.WatchFolders == 0 || watcher_ != nullptr) return;
+  const wxLogNull quiet;
+  watcher_ = std::make_unique<wxFileSystemWatcher>();
+  watcher_->SetOwner(this);
+  watcher_->Add(wxFileName::DirName(wxString::FromUTF8(model_.Folder())));
+}
+
+// --- what is shown how ---
+
+void BrowserPage::ShowView() {
+  const bool details = model_.Modes().view == choice::kViewDetails;
+  if (details && details_ == nullptr) {
+    DetailsList::Events events;
+    events.selectionChanged = [this] { host_.BrowserChanged(); };
+    events.activated = [this](size_t line) { Activate(line); };
+    events.contextMenu = [this](size_t line, const wxPoint& place) { host_.ShowContextMenu(*details_, place, line != kNoLine); };
+    events.sort = [this](int32_t sort) { SetSort(sort, model_.Modes().sort == sort && !model_.Descending()); };
+    details_ = new DetailsList(views_, model_, events);
+    views_->AddPage(details_, "Details");
+  }
+  const bool hadFocus = canvas_->HasFocus() || (details_ != nullptr && details_->HasFocus());
+  views_->SetSelection(details ? 1 : 0);
+  if (details) {
+    details_->ModelChanged();
+  } else {
+    canvas_->ModelChanged();
+    canvas_->ShowLine(model_.Selected().Focus());
+  }
+  if (hadFocus) FocusList();
+}
+
+void BrowserPage::SetViewMode(int32_t view) {
+  BrowserModes modes = model_.Modes();
+  modes.view = view;
+  model_.SetModes(modes);
+  ShowView();
+  host_.BrowserChanged();
+}
+
+void BrowserPage::SetThumbnailMode(int32_t mode) {
+  BrowserModes modes = model_.Modes();
+  modes.thumbnails = mode;
+  model_.SetModes(modes);
+  ShowView();
+  host_.BrowserChanged();
+}
+
+void BrowserPage::SetSort(int32_t sort, bool descending) {
+  model_.SetSort(sort, descending);
+  ShowView();
+  host_.BrowserChanged();
+}
+
+void BrowserPage::ChangeSize(int steps) {
+  const int32_t view = std::clamp(model_.Modes().view + steps, choice::kViewList + 0, choice::kViewLarge + 0);
+  if (view != model_.Modes().view) SetViewMode(view);
+}
+
+void BrowserPage::SelectionChanged() {
+  if (views_->GetSelection() == 1) {
+    details_->ShowSelection();
+  } else {
+    canvas_->ShowLine(model_.Selected().Focus());
+    canvas_->Refresh();
+  }
+  host_.BrowserChanged();
+}
+
+void BrowserPage::FocusName(const std::string& name) {
+  const size_t line = model_.FindLine(name);
+  if (line == kNoLine) return;
+  model_.Selected().SelectOnly(line);
+  SelectionChanged();
+}
+
+void BrowserPage::EditFocusedName() {
+  const size_t focus = model_.Selected().Focus();
+  if (focus == kNoLine) return;
+  if (views_->GetSelection() == 0) return canvas_->EditName(focus);
+  wxTextEntryDialog dialog(this, "New name:", "Rename", Shown(model_.Line(focus).name));
+  if (dialog.ShowModal() == wxID_OK) host_.RenameFile(model_.PathOfLine(focus), Utf8(dialog.GetValue()));
+}
+
+void BrowserPage::EditPath() {
+  path_->SetFocus();
+  path_->SelectAll();
+}
+
+void BrowserPage::EditFilter() { filter_->SetFocus(); }
+
+void BrowserPage::ApplyFilter() {
+  model_.SetFilter(Utf8(filter_->GetValue()));
+  if (views_->GetSelection() == 1) {
+    details_->ModelChanged();
+  } else {
+    canvas_->ModelChanged();
+  }
+  host_.BrowserChanged();
+}
+
+void BrowserPage::Activated() {
+  thumbnails_.SetListener([this](const std::vector<ThumbnailLoader::Result>& results) { ThumbnailsCame(results); });
+  canvas_->WantThumbnails();
+}
+
+void BrowserPage::ThumbnailsCame(const std::vector<ThumbnailLoader::Result>& results) {
+  canvas_->ThumbnailsCame(results);
+  host_.BrowserChanged();
+}
+
+void BrowserPage::FocusList() {
+  if (views_->GetSelection() == 1) {
+    details_->SetFocus();
+  } else {
+    canvas_->SetFocus();
+  }
+}
+
+size_t BrowserPage::MissingThumbnails() const { return views_->GetSelection() == 1 ? 0 : canvas_->MissingThumbnails(); }
+int64_t BrowserPage::Scroll() const { return canvas_->Scroll(); }
+
+void BrowserPage::Activate(size_t line) {
+  const FolderItem& item = model_.Line(line);
+  const std::string path = model_.PathOfLine(line);
+  if (item.folder) return Open(path);
+  host_.ViewFile(path);
+}
+
+void BrowserPage::BeginDrag() {
+  wxFileDataObject files;
+  for (const std::string& file : model_.FilesForFunction()) files.AddFile(wxString::FromUTF8(file));
+  if (files.GetFilenames().empty()) return;
+  wxDropSource source(files, this);
+  if (source.DoDragDrop(wxDrag_AllowMove) == wxDragMove) Reload();
+}
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,117 @@
+#include "desktop/windows/commands.h"
+
+#include "core/choice_lists.h"
+#include "desktop/windows/main_frame.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+// A command of the browser in front.
+template <void (BrowserPage::*action)()>
+void OfBrowser(MainFrame& frame) {
+  if (BrowserPage* browser = frame.Browser()) (browser->*action)();
+}
+
+template <int32_t view>
+void ShowAs(MainFrame& frame) {
+  if (BrowserPage* browser = frame.Browser()) browser->SetViewMode(view);
+}
+
+// Sorts by a mode; chosen again, the other way round.
+template <int32_t sort>
+void SortBy(MainFrame& frame) {
+  BrowserPage* browser = frame.Browser();
+  if (browser == nullptr) return;
+  browser->SetSort(sort, browser->Model().Modes().sort == sort && !browser->Model().Descending());
+}
+
+template <void (Selection::*action)()>
+void Select(MainFrame& frame) {
+  BrowserPage* browser = frame.Browser();
+  if (browser == nullptr) return;
+  (browser->Model().Selected().*action)();
+  browser->SelectionChanged();
+}
+
+void SelectSameType(MainFrame& frame) {
+  if (BrowserPage* browser = frame.Browser()) {
+    browser->Model().SelectSameType();
+    browser->SelectionChanged();
+  }
+}
+
+void NewTab(MainFrame& frame) { frame.OpenTab(frame.CurrentFolder()); }
+void CloseTab(MainFrame& frame) { frame.CloseTab(); }
+void ReopenTab(MainFrame& frame) { frame.ReopenTab(); }
+void NextTab(MainFrame& frame) { frame.StepTab(1); }
+void PreviousTab(MainFrame& frame) { frame.StepTab(-1); }
+void Quit(MainFrame& frame) { frame.Close(); }
+void ToggleFolders(MainFrame& frame) { frame.ShowFolders(!frame.FoldersShown()); }
+void Larger(MainFrame& frame) {
+  if (BrowserPage* browser = frame.Browser()) browser->ChangeSize(1);
+}
+void Smaller(MainFrame& frame) {
+  if (BrowserPage* browser = frame.Browser()) browser->ChangeSize(-1);
+}
+void View(MainFrame& frame) {
+  const std::vector<std::string> files = frame.SelectedFiles();
+  if (!files.empty()) frame.ViewFile(files.front());
+}
+
+constexpr const char* kFile = "&File";
+constexpr const char* kEdit = "&Edit";
+constexpr const char* kView = "&View";
+constexpr const char* kGo = "&Go";
+constexpr const char* kFunctions = "F&unctions";
+
+// clang-format off
+constexpr Command kCommands[] = {
+    {kFile, "New &tab",            "Ctrl+T",       "Opens another tab on this folder.", Needs::Nothing, NewTab},
+    {kFile, "&Close tab",          "Ctrl+W",       "Closes this tab.", Needs::Nothing, CloseTab},
+    {kFile, "&Reopen closed tab",  "Ctrl+Shift+T", "Opens the tab that was closed last.", Needs::ClosedTab, ReopenTab},
+    {kFile, nullptr},
+    {kFile, "&Quit",               "Ctrl+Q",       "Ends the program.", Needs::Nothing, Quit},
+
+    {kEdit, "&Rename...",          "F2",           "Gives the focused file another name.", Needs::Item, OfBrowser<&BrowserPage::EditFocusedName>, nullptr, true},
+    {kEdit, nullptr},
+    {kEdit, "Select &all",         "Ctrl+A",       "Selects all files that are shown.", Needs::Nothing, Select<&Selection::SelectAll>},
+    {kEdit, "Select &none",        "Ctrl+Shift+A", "Selects nothing.", Needs::Nothing, Select<&Selection::SelectNone>},
+    {kEdit, "&Invert selection",   "Ctrl+I",       "Selects what is not selected.", Needs::Nothing, Select<&Selection::Invert>},
+    {kEdit, "Select same t&ype",   "",             "Selects all files of the focused file's type.", Needs::Item, SelectSameType},
+    {kEdit, nullptr},
+    {kEdit, "&Filter",             "Ctrl+F",       "Shows only files whose names match.", Needs::Nothing, OfBrowser<&BrowserPage::EditFilter>},
+
+    {kView, "&List",               "Ctrl+1",       "Shows names only.", Needs::Nothing, ShowAs<choice::kViewList>},
+    {kView, "&Details",            "Ctrl+2",       "Shows names with type, size, date and dimensions.", Needs::Nothing, ShowAs<choice::kViewDetails>},
+    {kView, "&Small thumbnails",   "Ctrl+3",       "Shows small thumbnails.", Needs::Nothing, ShowAs<choice::kViewSmall>},
+    {kView, "&Normal thumbnails",  "Ctrl+4",       "Shows thumbnails of 96 pixels.", Needs::Nothing, ShowAs<choice::kViewNormal>},
+    {kView, "Lar&ge thumbnails",   "Ctrl+5",       "Shows thumbnails of 176 pixels.", Needs::Nothing, ShowAs<choice::kViewLarge>},
+    {kView, "Lar&ger",             "Ctrl++",       "Shows larger thumbnails.", Needs::Nothing, Larger},
+    {kView, "S&maller",            "Ctrl+-",       "Shows smaller thumbnails.", Needs::Nothing, Smaller},
+    {kView, nullptr},
+    {kView, "Sort by na&me",       "",             "Sorts by name; again, the other way round.", Needs::Nothing, SortBy<choice::kSortName>},
+    {kView, "Sort by &type",       "",             "Sorts by type; again, the other way round.", Needs::Nothing, SortBy<choice::kSortType>},
+    {kView, "Sort by si&ze",       "",             "Sorts by size; again, the other way round.", Needs::Nothing, SortBy<choice::kSortSize>},
+    {kView, "Sort by d&ate",       "",             "Sorts by date; again, the other way round.", Needs::Nothing, SortBy<choice::kSortDate>},
+    {kView, nullptr},
+    {kView, "&Folders",            "F9",           "Shows or hides the folders at the left.", Needs::Nothing, ToggleFolders},
+    {kView, "&Refresh",            "F5",           "Reads the folder again.", Needs::Nothing, OfBrowser<&BrowserPage::Reload>},
+
+    {kGo, "&Back",                 "Alt+Left",     "Goes to the folder before this one.", Needs::Nothing, OfBrowser<&BrowserPage::GoBack>},
+    {kGo, "&Forward",              "Alt+Right",    "Goes forward again.", Needs::Nothing, OfBrowser<&BrowserPage::GoForward>},
+    {kGo, "&Parent folder",        "Alt+Up",       "Goes to the folder above this one.", Needs::Nothing, OfBrowser<&BrowserPage::GoUp>},
+    {kGo, "&Enter a folder",       "Ctrl+L",       "Lets you type a folder.", Needs::Nothing, OfBrowser<&BrowserPage::EditPath>},
+    {kGo, nullptr},
+    {kGo, "&Next tab",             "Ctrl+PageDown", "Goes to the next tab.", Needs::Nothing, NextTab},
+    {kGo, "Pre&vious tab",         "Ctrl+PageUp",  "Goes to the previous tab.", Needs::Nothing, PreviousTab},
+
+    {kFunctions, "&View",          "Ctrl+Return",  "Shows the focused picture in a view window.", Needs::Files, View, "view", true},
+};
+// clang-format on
+
+}  // namespace
+
+std::span<const Command> Commands() { return kCommands; }
+
+}  // namespace fotomill::desktop

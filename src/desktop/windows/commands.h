@@ -1,0 +1,39 @@
+#pragma once
+
+#include <wx/defs.h>
+
+#include <span>
+
+namespace fotomill::desktop {
+
+class MainFrame;
+
+// When a command can be used; where it cannot, its menu item and button are grey.
+enum class Needs {
+  Nothing,
+  Files,    // at least one file selected or focused
+  Item,     // at least one file or folder
+  Undo,     // something to take back
+  ClosedTab,
+};
+
+// One function of the frame: a menu item, perhaps a button, its keys, and what it does. A new window is one row in
+// commands.cpp. Menus and toolbar are in the order of the rows; a row without text draws a line in its menu.
+struct Command {
+  const char* menu;                  // "&File"
+  const char* text;                  // with mnemonic; null for a separator
+  const char* accelerator = "";      // as wxWidgets writes them, empty for none
+  const char* help = "";             // one sentence for the status bar
+  Needs needs = Needs::Nothing;
+  void (*run)(MainFrame& frame) = nullptr;
+  const char* symbol = nullptr;      // of the button in the toolbar (bitmaps.cpp), null for no button
+  bool inContextMenu = false;        // of a file in a browser
+};
+
+std::span<const Command> Commands();
+
+// The id of a row's menu item and button.
+inline constexpr int kFirstCommandId = wxID_HIGHEST + 100;
+inline int CommandId(const Command& command) { return kFirstCommandId + static_cast<int>(&command - Commands().data()); }
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,39 @@
+#pragma once
+
+#include <wx/dataview.h>
+
+#include <functional>
+
+#include "desktop/browser_model.h"
+
+namespace fotomill::desktop {
+
+// The details view of a browser: a native list, which screen readers know how to read.
+class DetailsList : public wxDataViewCtrl {
+ public:
+  struct Events {
+    std::function<void()> selectionChanged;
+    std::function<void(size_t line)> activated;
+    std::function<void(size_t line, const wxPoint&)> contextMenu;
+    std::function<void(int32_t sortMode)> sort;  // the head of a column was clicked
+    std::function<void()> dragBegins;
+  };
+
+  DetailsList(wxWindow* parent, BrowserModel& model, Events events);
+
+  // Other lines, another order or other facts.
+  void ModelChanged();
+  // Marks what the model has selected and shows the focused line.
+  void ShowSelection();
+
+ private:
+  class Lines;
+  void ReadSelection();
+
+  BrowserModel& model_;
+  const Events events_;
+  wxObjectDataPtr<Lines> lines_;
+  bool changing_ = false;  // what the list tells now is what it was told
+};
+
+}  // namespace fotomill::desktop

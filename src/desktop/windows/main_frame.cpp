@@ -1,0 +1,272 @@
+#include "desktop/windows/main_frame.h"
+
+#include <wx/aui/auibook.h>
+#include <wx/menu.h>
+#include <wx/msgdlg.h>
+#include <wx/splitter.h>
+#include <wx/toolbar.h>
+
+#include <algorithm>
+#include <map>
+
+#include "core/configuration.h"
+#include "core/settings.h"
+#include "desktop/event_log.h"
+#include "desktop/windows/bitmaps.h"
+#include "desktop/windows/commands.h"
+#include "desktop/windows/folder_tree.h"
+#include "desktop/windows/view_frame.h"
+#include "desktop/windows/wx_text.h"
+#include "platform/files.h"
+#include "platform/folders.h"
+#include "platform/paths.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+constexpr const char* kTitle = "Fotomill Professional";
+enum StatusField { kCountField, kMessageField, kFieldCount };
+
+}  // namespace
+
+MainFrame::MainFrame()
+    : wxFrame(nullptr, wxID_ANY, kTitle, wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE, "FotomillProfessional") {
+  SetSize(FromDIP(wxSize(1180, 760)));
+  BuildMenus();
+  BuildToolbar();
+  BuildPanes();
+  CreateStatusBar(kFieldCount);
+  const int widths[] = {-2, -3};
+  SetStatusWidths(kFieldCount, widths);
+  SetStatusBarPane(kMessageField);
+  Bind(wxEVT_CLOSE_WINDOW, &MainFrame::OnClose, this);
+}
+
+MainFrame::~MainFrame() { thumbnails_.SetListener(nullptr); }
+
+// --- menus ---
+
+void MainFrame::BuildMenus() {
+  auto* bar = new wxMenuBar;
+  std::map<std::string, wxMenu*> menus;
+  for (const Command& command : Commands()) {
+    wxMenu*& menu = menus[command.menu];
+    if (menu == nullptr) bar->Append(menu = new wxMenu, command.menu);
+    if (command.text == nullptr) {
+      menu->AppendSeparator();
+      continue;
+    }
+    const wxString keys = *command.accelerator == '\0' ? wxString() : wxString("\t") + command.accelerator;
+    menu->Append(CommandId(command), command.text + keys, command.help);
+  }
+  SetMenuBar(bar);
+  const int last = kFirstCommandId + static_cast<int>(Commands().size()) - 1;
+  Bind(wxEVT_MENU, [this](wxCommandEvent& event) {
+    const Command& command = Commands()[static_cast<size_t>(event.GetId() - kFirstCommandId)];
+    if (Enabled(command)) command.run(*this);
+  }, kFirstCommandId, last);
+  Bind(wxEVT_UPDATE_UI, [this](wxUpdateUIEvent& event) {
+    event.Enable(Enabled(Commands()[static_cast<size_t>(event.GetId() - kFirstCommandId)]));
+  }, kFirstCommandId, last);
+}
+
+void MainFrame::BuildToolbar() {
+  wxToolBar* bar = CreateToolBar(wxTB_FLAT | wxTB_HORIZONTAL | wxTB_TEXT | wxTB_NODIVIDER, wxID_ANY, "Functions");
+  for (const Command& command : Commands()) {
+    if (command.symbol == nullptr) continue;
+    wxString label = wxControl::RemoveMnemonics(command.text);
+    label.EndsWith("...", &label);
+    bar->AddTool(CommandId(command), label, Symbol(command.symbol, 20), command.help);
+  }
+  bar->Realize();
+}
+
+bool MainFrame::Enabled(const Command& command) const {
+  const BrowserPage* browser = Browser();
+  switch (command.needs) {
+    case Needs::Files: return browser != nullptr && browser->Model().HasFileForFunction();
+    case Needs::Item: return browser != nullptr && browser->Model().Selected().Focus() != kNoLine;
+    case Needs::ClosedTab: return HasClosedTab();
+    case Needs::Undo: return false;
+    case Needs::Nothing: break;
+  }
+  return true;
+}
+
+void MainFrame::ShowContextMenu(wxWindow& window, const wxPoint& place, bool onFile) {
+  if (!onFile) return;
+  wxMenu menu;
+  for (const Command& command : Commands()) {
+    if (command.text == nullptr || !command.inContextMenu) continue;
+    const wxString keys = *command.accelerator == '\0' ? wxString() : wxString("\t") + command.accelerator;
+    menu.Append(CommandId(command), command.text + keys, command.help);
+  }
+  window.PopupMenu(&menu, place);
+}
+
+// --- panes and tabs ---
+
+void MainFrame::BuildPanes() {
+  splitter_ = new wxSplitterWindow(this, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxSP_LIVE_UPDATE | wxSP_NOBORDER);
+  splitter_->SetMinimumPaneSize(FromDIP(120));
+  tree_ = new FolderTree(splitter_, [this](const std::string& folder) {
+    if (BrowserPage* browser = Browser()) browser->Open(folder);
+  });
+  tabs_ = new wxAuiNotebook(splitter_, wxID_ANY, wxDefaultPosition, wxDefaultSize,
+                            wxAUI_NB_TOP | wxAUI_NB_TAB_MOVE | wxAUI_NB_SCROLL_BUTTONS | wxAUI_NB_CLOSE_ON_ALL_TABS |
+                                wxAUI_NB_MIDDLE_CLICK_CLOSE | wxBORDER_NONE);
+  tabs_->SetArtProvider(new wxAuiGenericTabArt);
+  tabs_->Bind(wxEVT_AUINOTEBOOK_PAGE_CHANGED, &MainFrame::OnTabChanged, this);
+  tabs_->Bind(wxEVT_AUINOTEBOOK_PAGE_CLOSE, [this](wxAuiNotebookEvent& event) {
+    if (tabs_->GetPageCount() == 1) return event.Veto();
+    closedTabs_.push_back(PageAt(static_cast<size_t>(event.GetSelection()))->Model().Folder());
+  });
+  const int place = settings.RememberNavPaneHPosition > 0 ? settings.RememberNavPaneHPosition : 230;
+  splitter_->SplitVertically(tree_, tabs_, FromDIP(place));
+}
+
+BrowserPage* MainFrame::PageAt(size_t tab) const { return static_cast<BrowserPage*>(tabs_->GetPage(tab)); }
+
+BrowserPage* MainFrame::Browser() const {
+  const int tab = tabs_->GetSelection();
+  return tab == wxNOT_FOUND ? nullptr : PageAt(static_cast<size_t>(tab));
+}
+
+std::vector<std::string> MainFrame::SelectedFiles() const {
+  const BrowserPage* browser = Browser();
+  return browser == nullptr ? std::vector<std::string>() : browser->Model().FilesForFunction();
+}
+
+std::string MainFrame::CurrentFolder() const {
+  const BrowserPage* browser = Browser();
+  return browser == nullptr ? platform::CurrentFolder() : browser->Model().Folder();
+}
+
+BrowserPage* MainFrame::OpenTab(const std::string& folder) {
+  BrowserModes modes{settings.DefaultThumbnailMode, settings.DefaultViewMode, settings.DefaultSortMode};
+  if (const BrowserPage* browser = Browser()) modes = browser->Model().Modes();
+  auto* page = new BrowserPage(tabs_, *this, thumbnails_, modes);
+  tabs_->AddPage(page, Shown(platform::FileNameOf(folder)), true);
+  page->Open(folder);
+  page->FocusList();
+  return page;
+}
+
+void MainFrame::CloseTab() {
+  const int tab = tabs_->GetSelection();
+  if (tab == wxNOT_FOUND || tabs_->GetPageCount() == 1) return;
+  closedTabs_.push_back(PageAt(static_cast<size_t>(tab))->Model().Folder());
+  tabs_->DeletePage(static_cast<size_t>(tab));
+}
+
+void MainFrame::ReopenTab() {
+  if (closedTabs_.empty()) return;
+  const std::string folder = closedTabs_.back();
+  closedTabs_.pop_back();
+  OpenTab(folder);
+}
+
+void MainFrame::StepTab(int step) {
+  const int count = static_cast<int>(tabs_->GetPageCount());
+  if (count > 1) tabs_->SetSelection(static_cast<size_t>((tabs_->GetSelection() + step + count) % count));
+}
+
+void MainFrame::OnTabChanged(wxAuiNotebookEvent& event) {
+  if (BrowserPage* browser = Browser()) {
+    browser->Activated();
+    CallAfter([this] {
+      if (BrowserPage* shown = Browser()) shown->FocusList();
+    });
+  }
+  BrowserChanged();
+  event.Skip();
+}
+
+bool MainFrame::FoldersShown() const { return splitter_->IsSplit(); }
+
+void MainFrame::ShowFolders(bool show) {
+  if (show == FoldersShown()) return;
+  if (show) {
+    tree_->Show();
+    splitter_->SplitVertically(tree_, tabs_, FromDIP(std::max(settings.RememberNavPaneHPosition, 160)));
+  } else {
+    settings.RememberNavPaneHPosition = ToDIP(splitter_->GetSashPosition());
+    splitter_->Unsplit(tree_);
+  }
+}
+
+// --- what browsers ask for ---
+
+void MainFrame::BrowserChanged() {
+  const BrowserPage* browser = Browser();
+  if (browser == nullptr) return;
+  const BrowserModel& model = browser->Model();
+  const wxString name = model.Folder() == "/" ? wxString("/") : Shown(platform::FileNameOf(model.Folder()));
+  const size_t tab = static_cast<size_t>(tabs_->GetSelection());
+  if (tabs_->GetPageText(tab) != name) {
+    tabs_->SetPageText(tab, name);
+    tabs_->SetPageToolTip(tab, Shown(model.Folder()));
+    SetTitle(name + " - " + kTitle);
+  }
+  SetStatusText(Shown(model.CountText()), kCountField);
+  tree_->Follow(model.Folder());
+  LogState();
+}
+
+void MainFrame::ViewFile(const std::string& path) {
+  const BrowserPage* browser = Browser();
+  if (browser == nullptr) return;
+  const std::vector<std::string> selected = browser->Model().FilesForFunction();
+  ViewFiles(selected.size() > 1 ? selected : browser->Model().ShownFiles(), path);
+}
+
+void MainFrame::ViewFiles(const std::vector<std::string>& list, const std::string& file) {
+  auto* view = new ViewFrame(*this, list, file);
+  view->Show();
+}
+
+void MainFrame::RenameFile(const std::string& path, const std::string& name) {
+  const std::string target = platform::JoinFolder(platform::AbsolutePath(path + "/.."), name);
+  const platform::CommitResult result = platform::RenameFile(path, target, platform::Existing::Refuse);
+  if (result == platform::CommitResult::Done) {
+    if (BrowserPage* browser = Browser()) browser->Open(browser->Model().Folder(), name);
+    return;
+  }
+  wxMessageBox(Shown(result == platform::CommitResult::Taken ? "There is a file \"" + name + "\" already." : "The file could not be renamed."),
+               "Rename", wxOK | wxICON_WARNING, this);
+}
+
+void MainFrame::DropFiles(const std::vector<std::string>&, const std::string&, bool) {}
+
+void MainFrame::SettingsChanged() {
+  thumbnails_.Clear();
+  for (size_t tab = 0; tab < tabs_->GetPageCount(); ++tab) PageAt(tab)->Reload();
+}
+
+void MainFrame::Tell(const std::string& text) { SetStatusText(Shown(text), kMessageField); }
+
+// --- state ---
+
+void MainFrame::LogState() {
+  const BrowserPage* browser = Browser();
+  if (!EventLogOn() || browser == nullptr) return;
+  const BrowserModel& model = browser->Model();
+  const size_t focus = model.Selected().Focus();
+  std::string state = "tabs=" + std::to_string(tabs_->GetPageCount()) + " lines=" + std::to_string(model.LineCount()) +
+                      " items=" + std::to_string(model.ItemCount()) + " selected=" + std::to_string(model.Selected().SelectedCount()) +
+                      " missing=" + std::to_string(browser->MissingThumbnails()) + " listing=" + std::to_string(browser->Listing()) +
+                      " view=" + std::to_string(model.Modes().view) + " sort=" + std::to_string(model.Modes().sort) +
+                      " focus=" + (focus == kNoLine ? std::string("-") : model.Line(focus).name) + " folder=" + model.Folder();
+  if (state == loggedState_) return;
+  loggedState_ = state;
+  LogEvent("browser", state);
+}
+
+void MainFrame::OnClose(wxCloseEvent& event) {
+  if (FoldersShown()) settings.RememberNavPaneHPosition = ToDIP(splitter_->GetSashPosition());
+  (void)SaveConfiguration();
+  event.Skip();
+}
+
+}  // namespace fotomill::desktop

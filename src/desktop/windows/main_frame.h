@@ -1,0 +1,74 @@
+#pragma once
+
+#include <wx/frame.h>
+
+#include <string>
+#include <vector>
+
+#include "desktop/windows/browser_page.h"
+#include "desktop/windows/thumbnail_service.h"
+
+class wxAuiNotebook;
+class wxAuiNotebookEvent;
+class wxSplitterWindow;
+
+namespace fotomill::desktop {
+
+class FolderTree;
+class ViewFrame;
+struct Command;
+
+// The program's window: a tab for each browser, the folders at the left, menus and toolbar from the table of commands.
+class MainFrame : public wxFrame, public BrowserHost {
+ public:
+  MainFrame();
+  ~MainFrame() override;
+
+  // The browser in front; there is always one once a folder was opened.
+  BrowserPage* Browser() const;
+  // What functions work on: files selected in the browser in front, in list order, or else the focused one.
+  std::vector<std::string> SelectedFiles() const;
+  std::string CurrentFolder() const;
+
+  BrowserPage* OpenTab(const std::string& folder);
+  void CloseTab();
+  void ReopenTab();
+  void StepTab(int step);
+  bool HasClosedTab() const { return !closedTabs_.empty(); }
+  void ShowFolders(bool show);
+  bool FoldersShown() const;
+  ThumbnailService& Thumbnails() { return thumbnails_; }
+
+  // Opens a view window on a file, with the files of `list` as its neighbours.
+  void ViewFiles(const std::vector<std::string>& list, const std::string& file);
+  // Settings have changed: every window shows what they say now.
+  void SettingsChanged();
+  // A line in the status bar.
+  void Tell(const std::string& text);
+
+  // BrowserHost
+  void BrowserChanged() override;
+  void ViewFile(const std::string& path) override;
+  void ShowContextMenu(wxWindow& window, const wxPoint& place, bool onFile) override;
+  void RenameFile(const std::string& path, const std::string& name) override;
+  void DropFiles(const std::vector<std::string>& files, const std::string& folder, bool move) override;
+
+ private:
+  void BuildMenus();
+  void BuildToolbar();
+  void BuildPanes();
+  bool Enabled(const Command& command) const;
+  void OnTabChanged(wxAuiNotebookEvent& event);
+  void OnClose(wxCloseEvent& event);
+  void LogState();
+  BrowserPage* PageAt(size_t tab) const;
+
+  ThumbnailService thumbnails_;
+  wxSplitterWindow* splitter_ = nullptr;
+  FolderTree* tree_ = nullptr;
+  wxAuiNotebook* tabs_ = nullptr;
+  std::vector<std::string> closedTabs_;  // folders, the latest last
+  std::string loggedState_;
+};
+
+}  // namespace fotomill::desktop

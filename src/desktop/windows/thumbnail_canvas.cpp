@@ -1,0 +1,555 @@
+#include "desktop/windows/thumbnail_canvas.h"
+
+#include <wx/control.h>
+#include <wx/dcclient.h>
+#include <wx/settings.h>
+#include <wx/textctrl.h>
+
+#include <algorithm>
+#include <cmath>
+
+#include "core/choice_lists.h"
+#include "core/settings.h"
+#include "core/text.h"
+#include "desktop/windows/bitmaps.h"
+#include "desktop/windows/wx_text.h"
+#include "picture/registry.h"
+#include "platform/clock.h"
+#include "platform/paths.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+constexpr int kPadding = 6;            // inside a cell, device-independent pixels
+constexpr int kListWidth = 240;        // of a line in the list of names
+constexpr size_t kMostBitmaps = 1500;  // kept for drawing
+constexpr size_t kMostCutNames = 5000;
+constexpr double kTypingPause = 1.0;   // seconds after which typing begins anew
+constexpr size_t kPrecache = 256;      // thumbnails wanted beyond what is near
+
+wxColour Blend(const wxColour& a, const wxColour& b, double part) {
+  const auto mix = [part](int x, int y) { return static_cast<unsigned char>(std::lround(x + (y - x) * part)); };
+  return {mix(a.Red(), b.Red()), mix(a.Green(), b.Green()), mix(a.Blue(), b.Blue())};
+}
+
+}  // namespace
+
+// The colours of one painting.
+struct ThumbnailCanvas::Looks {
+  wxColour background = wxSystemSettings::GetColour(wxSYS_COLOUR_LISTBOX);
+  wxColour text = wxSystemSettings::GetColour(wxSYS_COLOUR_LISTBOXTEXT);
+  wxColour highlight = wxSystemSettings::GetColour(wxSYS_COLOUR_HIGHLIGHT);
+  wxColour highlightText = wxSystemSettings::GetColour(wxSYS_COLOUR_HIGHLIGHTTEXT);
+  wxColour frame = Blend(background, text, 0.18);
+  wxColour faint = Blend(background, text, 0.06);
+  wxColour note = Blend(background, text, 0.62);
+};
+
+ThumbnailCanvas::ThumbnailCanvas(wxWindow* parent, BrowserModel& model, ThumbnailService& thumbnails, Events events)
+    : model_(model), thumbnails_(thumbnails), events_(std::move(events)), bandTimer_(this) {
+  SetBackgroundStyle(wxBG_STYLE_PAINT);
+  Create(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxVSCROLL | wxWANTS_CHARS | wxBORDER_NONE, "Thumbnails");
+  SetLabel("Files of the folder");
+  Bind(wxEVT_PAINT, &ThumbnailCanvas::OnPaint, this);
+  Bind(wxEVT_SIZE, &ThumbnailCanvas::OnSize, this);
+  for (const auto& type : {wxEVT_SCROLLWIN_TOP, wxEVT_SCROLLWIN_BOTTOM, wxEVT_SCROLLWIN_LINEUP, wxEVT_SCROLLWIN_LINEDOWN,
+                           wxEVT_SCROLLWIN_PAGEUP, wxEVT_SCROLLWIN_PAGEDOWN, wxEVT_SCROLLWIN_THUMBTRACK,
+                           wxEVT_SCROLLWIN_THUMBRELEASE}) {
+    Bind(type, &ThumbnailCanvas::OnScroll, this);
+  }
+  Bind(wxEVT_MOUSEWHEEL, &ThumbnailCanvas::OnWheel, this);
+  Bind(wxEVT_LEFT_DOWN, &ThumbnailCanvas::OnMouseDown, this);
+  Bind(wxEVT_LEFT_UP, &ThumbnailCanvas::OnMouseUp, this);
+  Bind(wxEVT_MOTION, &ThumbnailCanvas::OnMouseMove, this);
+  Bind(wxEVT_LEFT_DCLICK, &ThumbnailCanvas::OnDoubleClick, this);
+  Bind(wxEVT_RIGHT_DOWN, &ThumbnailCanvas::OnRightDown, this);
+  Bind(wxEVT_KEY_DOWN, &ThumbnailCanvas::OnKey, this);
+  Bind(wxEVT_CHAR, &ThumbnailCanvas::OnChar, this);
+  Bind(wxEVT_MOUSE_CAPTURE_LOST, [this](wxMouseCaptureLostEvent&) {
+    pressed_.reset();
+    banding_ = false;
+  });
+  Bind(wxEVT_SET_FOCUS, [this](wxFocusEvent& event) { Refresh(), event.Skip(); });
+  Bind(wxEVT_KILL_FOCUS, [this](wxFocusEvent& event) { Refresh(), event.Skip(); });
+  Bind(wxEVT_SYS_COLOUR_CHANGED, [this](wxSysColourChangedEvent& event) { Refresh(), event.Skip(); });
+  Bind(wxEVT_DPI_CHANGED, [this](wxDPIChangedEvent& event) { ModelChanged(), event.Skip(); });
+  // While the rubber band is held beyond the edge the list goes on scrolling.
+  Bind(wxEVT_TIMER, [this](wxTimerEvent&) {
+    const wxPoint mouse = ScreenToClient(wxGetMousePosition());
+    const int beyond = mouse.y < 0 ? mouse.y : std::max(mouse.y - GetClientSize().y, 0);
+    if (banding_ && beyond != 0) ScrollTo(scroll_ + beyond);
+  });
+  MeasureCells();
+}
+
+bool ThumbnailCanvas::ListsNames() const { return model_.Modes().view == choice::kViewList; }
+
+void ThumbnailCanvas::MeasureCells() {
+  SetFont(wxSystemSettings::GetFont(wxSYS_DEFAULT_GUI_FONT));
+  textHeight_ = GetCharHeight();
+  const int padding = FromDIP(kPadding);
+  if (ListsNames()) {
+    square_ = 0;
+    layout_.SetCells(FromDIP(kListWidth), textHeight_ + padding, FromDIP(2));
+  } else {
+    square_ = FromDIP(model_.Modes().view == choice::kViewSmall ? 48 : model_.Modes().view == choice::kViewLarge ? 176 : 96);
+    const int width = std::max(square_ + 4 * padding, FromDIP(96));
+    layout_.SetCells(width, square_ + textHeight_ + 3 * padding, FromDIP(4));
+  }
+  layout_.SetCount(model_.LineCount());
+  layout_.SetWindow(GetClientSize().x, GetClientSize().y);
+}
+
+void ThumbnailCanvas::ModelChanged() {
+  FinishEdit(false);
+  MeasureCells();
+  scroll_ = std::clamp<int64_t>(scroll_, 0, layout_.LargestScroll());
+  UpdateScrollbar();
+  WantThumbnails();
+  Refresh();
+}
+
+void ThumbnailCanvas::UpdateScrollbar() {
+  SetScrollbar(wxVERTICAL, static_cast<int>(scroll_), GetClientSize().y, static_cast<int>(layout_.TotalHeight()));
+}
+
+ThumbnailWish ThumbnailCanvas::WishOf(size_t line) const {
+  const FolderItem& item = model_.Line(line);
+  ThumbnailWish wish;
+  wish.path = model_.PathOfLine(line);
+  wish.modified = item.modified;
+  wish.size = item.size;
+  wish.side = static_cast<int32_t>(std::lround(square_ * GetContentScaleFactor()));
+  wish.mode = model_.Modes().thumbnails;
+  return wish;
+}
+
+// What is visible first, then a screen ahead in the direction of scrolling, then the rest from there on, if it is to be
+// made before anybody looks at it.
+void ThumbnailCanvas::WantThumbnails() {
+  std::vector<ThumbnailWish> wishes;
+  const auto want = [&](size_t first, size_t end) {
+    for (size_t line = first; line < end; ++line) {
+      const FolderItem& item = model_.Line(line);
+      if (item.folder || item.modified == 0) continue;  // its time is not known yet
+      ThumbnailWish wish = WishOf(line);
+      if (thumbnails_.Find(wish) == nullptr) wishes.push_back(std::move(wish));
+    }
+  };
+  if (square_ > 0 && model_.LineCount() > 0) {
+    const int height = GetClientSize().y;
+    const CellLayout::Range visible = layout_.Visible(scroll_);
+    want(visible.first, visible.end);
+    const int64_t ahead = direction_ > 0 ? scroll_ + height : std::max<int64_t>(scroll_ - height, 0);
+    const CellLayout::Range next = layout_.LinesBetween(ahead, ahead + height);
+    if (direction_ > 0) want(std::max(next.first, visible.end), next.end);
+    if (direction_ < 0) want(next.first, std::min(next.end, visible.first));
+    if (settings.BrowserThumbnailPrecacheEnable != 0) {
+      for (size_t line = visible.end; line < model_.LineCount() && wishes.size() < kPrecache; ++line) want(line, line + 1);
+    }
+  }
+  thumbnails_.Want(std::move(wishes));
+}
+
+void ThumbnailCanvas::ThumbnailsCame(const std::vector<ThumbnailLoader::Result>&) {
+  Refresh();
+  if (thumbnails_.Pending() == 0) WantThumbnails();
+}
+
+size_t ThumbnailCanvas::MissingThumbnails() {
+  size_t missing = 0;
+  const CellLayout::Range visible = layout_.Visible(scroll_);
+  for (size_t line = visible.first; line < visible.end && square_ > 0; ++line) {
+    if (!model_.Line(line).folder && thumbnails_.Find(WishOf(line)) == nullptr) ++missing;
+  }
+  return missing;
+}
+
+void ThumbnailCanvas::ShowLine(size_t line) {
+  if (line != kNoLine) ScrollTo(layout_.ScrollToShow(line, scroll_));
+}
+
+void ThumbnailCanvas::ScrollTo(int64_t scroll) {
+  scroll = std::clamp<int64_t>(scroll, 0, layout_.LargestScroll());
+  if (scroll == scroll_) return;
+  FinishEdit(true);
+  direction_ = scroll > scroll_ ? 1 : -1;
+  scroll_ = scroll;
+  UpdateScrollbar();
+  WantThumbnails();
+  Refresh();
+}
+
+// --- drawing ---
+
+void ThumbnailCanvas::OnPaint(wxPaintEvent&) {
+  wxPaintDC dc(this);
+  const Looks looks;
+  dc.SetBackground(wxBrush(looks.background));
+  dc.Clear();
+  dc.SetFont(GetFont());
+  if (model_.LineCount() == 0 && !model_.Folder().empty()) {
+    dc.SetTextForeground(looks.note);
+    dc.DrawLabel(model_.Filter().empty() ? "There are no pictures in this folder." : "No name matches the filter.",
+                 wxRect(GetClientSize()), wxALIGN_CENTER);
+  }
+  const CellLayout::Range visible = layout_.Visible(scroll_);
+  for (size_t line = visible.first; line < visible.end; ++line) DrawCell(dc, line, looks);
+  if (banding_ && pressed_) {
+    const wxRect band(wxPoint(std::min(pressed_->x, bandEnd_.x), static_cast<int>(std::min(pressed_->y, bandEnd_.y) - scroll_)),
+                      wxSize(std::abs(pressed_->x - bandEnd_.x) + 1, std::abs(pressed_->y - bandEnd_.y) + 1));
+    dc.SetPen(wxPen(looks.highlight));
+    dc.SetBrush(wxBrush(wxColour(looks.highlight.Red(), looks.highlight.Green(), looks.highlight.Blue(), 48)));
+    dc.DrawRectangle(band);
+  }
+}
+
+void ThumbnailCanvas::DrawCell(wxDC& dc, size_t line, const Looks& looks) {
+  const Rect place = layout_.Cell(line);
+  const wxRect cell(place.x, static_cast<int>(place.y - scroll_), place.width, place.height);
+  const bool selected = model_.Selected().IsSelected(line);
+  const bool focused = model_.Selected().Focus() == line && HasFocus();
+  const wxColour marked = HasFocus() ? looks.highlight : Blend(looks.highlight, looks.background, 0.45);
+  if (selected) {
+    dc.SetPen(*wxTRANSPARENT_PEN);
+    dc.SetBrush(wxBrush(marked));
+    dc.DrawRoundedRectangle(cell, FromDIP(5));
+  }
+  if (focused) {
+    dc.SetPen(wxPen(selected ? looks.highlightText : looks.highlight, FromDIP(1), wxPENSTYLE_DOT));
+    dc.SetBrush(*wxTRANSPARENT_BRUSH);
+    dc.DrawRoundedRectangle(wxRect(cell).Deflate(FromDIP(2)), FromDIP(4));
+  }
+  const FolderItem& item = model_.Line(line);
+  const int padding = FromDIP(kPadding);
+  dc.SetTextForeground(selected ? looks.highlightText : looks.text);
+  if (square_ == 0) {
+    const wxRect icon(cell.x + padding, cell.y + (cell.height - FromDIP(16)) / 2, FromDIP(16), FromDIP(16));
+    DrawPlaceholder(dc, item, icon, {}, looks);
+    const int left = icon.GetRight() + padding;
+    dc.SetTextForeground(selected ? looks.highlightText : looks.text);
+    dc.DrawText(CutName(dc, item.name, cell.GetRight() - left - padding), left, cell.y + (cell.height - textHeight_) / 2);
+    return;
+  }
+  const wxRect square(cell.x + (cell.width - square_) / 2, cell.y + padding, square_, square_);
+  DrawPicture(dc, line, square, looks);
+  if (line == editedLine_) return;
+  const wxString name = CutName(dc, item.name, cell.width - 2 * FromDIP(3));
+  dc.SetTextForeground(selected ? looks.highlightText : looks.text);
+  dc.DrawText(name, cell.x + (cell.width - dc.GetTextExtent(name).x) / 2, square.GetBottom() + 1 + padding);
+}
+
+void ThumbnailCanvas::DrawPicture(wxDC& dc, size_t line, const wxRect& square, const Looks& looks) {
+  const FolderItem& item = model_.Line(line);
+  if (item.folder) return DrawPlaceholder(dc, item, square, {}, looks);
+  const ThumbnailWish wish = WishOf(line);
+  ThumbnailPointer thumbnail = thumbnails_.Find(wish);
+  const bool right = thumbnail != nullptr;
+  if (!right) thumbnail = thumbnails_.FindAny(wish.path);
+  if (thumbnail == nullptr || thumbnail->status != Status::Ok) {
+    return DrawPlaceholder(dc, item, square, thumbnail == nullptr ? wxString() : wxString("!"), looks);
+  }
+  const wxBitmap& bitmap = BitmapOfThumbnail(thumbnail);
+  if (!bitmap.IsOk()) return DrawPlaceholder(dc, item, square, "!", looks);
+  // One of another size stands in until the right one comes.
+  double shrink = 1;
+  const wxSize size = wxSize(static_cast<int>(std::lround(bitmap.GetLogicalWidth())), static_cast<int>(std::lround(bitmap.GetLogicalHeight())));
+  if (!right) shrink = std::min(1.0, static_cast<double>(square_) / std::max({size.x, size.y, 1}));
+  const wxSize shown(std::max(static_cast<int>(size.x * shrink), 1), std::max(static_cast<int>(size.y * shrink), 1));
+  const wxPoint corner(square.x + (square.width - shown.x) / 2, square.y + (square.height - shown.y) / 2);
+  if (shrink == 1) {
+    dc.DrawBitmap(bitmap, corner);
+  } else {
+    dc.SetUserScale(shrink, shrink);
+    dc.DrawBitmap(bitmap, static_cast<int>(corner.x / shrink), static_cast<int>(corner.y / shrink));
+    dc.SetUserScale(1, 1);
+  }
+  dc.SetPen(wxPen(looks.frame));
+  dc.SetBrush(*wxTRANSPARENT_BRUSH);
+  dc.DrawRectangle(wxRect(corner, shown).Inflate(1));
+  if (thumbnail->pages > 1) {
+    const wxString pages = wxString::Format("%d", thumbnail->pages);
+    const wxSize extent = dc.GetTextExtent(pages) + FromDIP(wxSize(8, 2));
+    const wxRect badge(wxPoint(corner.x + shown.x - extent.x, corner.y + shown.y - extent.y), extent);
+    dc.SetPen(*wxTRANSPARENT_PEN);
+    dc.SetBrush(wxBrush(looks.highlight));
+    dc.DrawRoundedRectangle(badge, FromDIP(3));
+    dc.SetTextForeground(looks.highlightText);
+    dc.DrawLabel(pages, badge, wxALIGN_CENTER);
+  }
+}
+
+// A folder, or a sheet with the file's extension: what there is before, or instead of, a thumbnail.
+void ThumbnailCanvas::DrawPlaceholder(wxDC& dc, const FolderItem& item, const wxRect& square, const wxString& mark,
+                                      const Looks& looks) {
+  if (item.folder) {
+    const int side = square.width;
+    const wxRect body(square.x + side / 10, square.y + side * 3 / 10, side * 8 / 10, side * 11 / 20);
+    const wxColour paper(0xe8, 0xb9, 0x4a), tab(0xc9, 0x95, 0x2b);
+    dc.SetPen(*wxTRANSPARENT_PEN);
+    dc.SetBrush(wxBrush(tab));
+    dc.DrawRoundedRectangle(body.x, body.y - side / 10, body.width * 9 / 20, side / 4, std::max(side / 24.0, 1.0));
+    dc.SetBrush(wxBrush(paper));
+    dc.DrawRoundedRectangle(body, std::max(side / 24.0, 1.0));
+    return;
+  }
+  const int height = square.height * 3 / 4, width = height * 3 / 4;
+  const wxRect sheet(square.x + (square.width - width) / 2, square.y + (square.height - height) / 2, width, height);
+  dc.SetPen(wxPen(looks.frame));
+  dc.SetBrush(wxBrush(looks.faint));
+  dc.DrawRoundedRectangle(sheet, std::max(square.width / 32.0, 1.0));
+  if (square.width < FromDIP(40)) return;
+  dc.SetTextForeground(mark.empty() ? looks.note : wxColour(0xd0, 0x38, 0x2c));
+  wxRect text(sheet);
+  if (!mark.empty()) {
+    const wxFont font = dc.GetFont();
+    dc.SetFont(font.Scaled(1.8f).Bold());
+    dc.DrawLabel(mark, wxRect(sheet.x, sheet.y, sheet.width, sheet.height * 3 / 5), wxALIGN_CENTER);
+    dc.SetFont(font);
+    text = wxRect(sheet.x, sheet.y + sheet.height / 2, sheet.width, sheet.height / 2);
+  }
+  dc.DrawLabel(Shown(UpperCase(platform::ExtensionOf(item.name))), text, wxALIGN_CENTER);
+}
+
+wxString ThumbnailCanvas::CutName(wxDC& dc, const std::string& name, int width) {
+  if (width != cutWidth_ || cutNames_.size() > kMostCutNames) cutNames_.clear();
+  cutWidth_ = width;
+  const auto [found, added] = cutNames_.try_emplace(name);
+  if (added) found->second = wxControl::Ellipsize(Shown(name), dc, wxELLIPSIZE_MIDDLE, width, wxELLIPSIZE_FLAGS_NONE);
+  return found->second;
+}
+
+const wxBitmap& ThumbnailCanvas::BitmapOfThumbnail(const ThumbnailPointer& thumbnail) {
+  const auto found = bitmaps_.find(thumbnail.get());
+  if (found != bitmaps_.end()) return found->second.bitmap;
+  if (bitmaps_.size() > kMostBitmaps) bitmaps_.clear();
+  return bitmaps_.try_emplace(thumbnail.get(), Drawn{thumbnail, BitmapOf(thumbnail->pixels, GetContentScaleFactor())})
+      .first->second.bitmap;
+}
+
+// --- scrolling ---
+
+void ThumbnailCanvas::OnSize(wxSizeEvent& event) {
+  layout_.SetWindow(GetClientSize().x, GetClientSize().y);
+  scroll_ = std::clamp<int64_t>(scroll_, 0, layout_.LargestScroll());
+  UpdateScrollbar();
+  WantThumbnails();
+  Refresh();
+  event.Skip();
+}
+
+void ThumbnailCanvas::OnScroll(wxScrollWinEvent& event) {
+  const wxEventType type = event.GetEventType();
+  const int64_t page = std::max(GetClientSize().y - layout_.RowHeight(), layout_.RowHeight());
+  int64_t target = event.GetPosition();
+  if (type == wxEVT_SCROLLWIN_TOP) target = 0;
+  if (type == wxEVT_SCROLLWIN_BOTTOM) target = layout_.LargestScroll();
+  if (type == wxEVT_SCROLLWIN_LINEUP) target = scroll_ - layout_.RowHeight();
+  if (type == wxEVT_SCROLLWIN_LINEDOWN) target = scroll_ + layout_.RowHeight();
+  if (type == wxEVT_SCROLLWIN_PAGEUP) target = scroll_ - page;
+  if (type == wxEVT_SCROLLWIN_PAGEDOWN) target = scroll_ + page;
+  ScrollTo(target);
+}
+
+void ThumbnailCanvas::OnWheel(wxMouseEvent& event) {
+  if (event.GetWheelAxis() != wxMOUSE_WHEEL_VERTICAL || event.GetWheelDelta() == 0) return event.Skip();
+  const double notches = static_cast<double>(event.GetWheelRotation()) / event.GetWheelDelta();
+  if (event.ControlDown()) {
+    if (events_.resize && notches != 0) events_.resize(notches > 0 ? 1 : -1);
+    return;
+  }
+  const double step = ListsNames() ? 3.0 * layout_.RowHeight() : std::max(layout_.RowHeight() / 2.0, FromDIP(60) * 1.0);
+  ScrollTo(scroll_ - std::lround(notches * step));
+}
+
+// --- mouse ---
+
+size_t ThumbnailCanvas::LineAt(const wxPoint& point) const { return layout_.LineAt(point.x, point.y + scroll_); }
+
+void ThumbnailCanvas::TellSelection() {
+  Refresh();
+  if (events_.selectionChanged) events_.selectionChanged();
+}
+
+void ThumbnailCanvas::OnMouseDown(wxMouseEvent& event) {
+  FinishEdit(true);
+  SetFocus();
+  const size_t line = LineAt(event.GetPosition());
+  pressed_ = wxPoint(event.GetX(), static_cast<int>(event.GetY() + scroll_));
+  pressedLine_ = line;
+  if (!HasCapture()) CaptureMouse();
+  Selection& selection = model_.Selected();
+  if (line == kNoLine) {
+    const bool keep = event.ControlDown() || event.ShiftDown();
+    if (!keep) selection.ClickBlank(settings.ClearAllOnBlankClick != 0);
+    return TellSelection();
+  }
+  // A press on a selected line may begin a drag of all; what a plain click does is done when the button goes up.
+  if (selection.IsSelected(line) && !event.ControlDown() && !event.ShiftDown()) return;
+  selection.Click(line, event.ShiftDown(), event.ControlDown());
+  pressedLine_ = kNoLine == line ? kNoLine : line;
+  TellSelection();
+}
+
+void ThumbnailCanvas::OnMouseUp(wxMouseEvent& event) {
+  if (HasCapture()) ReleaseMouse();
+  bandTimer_.Stop();
+  const bool click = pressed_ && !banding_ && pressedLine_ != kNoLine && !event.ControlDown() && !event.ShiftDown();
+  if (click && LineAt(event.GetPosition()) == pressedLine_) {
+    model_.Selected().Click(pressedLine_, false, false);
+    TellSelection();
+  }
+  pressed_.reset();
+  banding_ = false;
+  Refresh();
+}
+
+void ThumbnailCanvas::OnMouseMove(wxMouseEvent& event) {
+  if (!pressed_ || !event.LeftIsDown()) return UpdateTip(LineAt(event.GetPosition()));
+  const wxPoint now(event.GetX(), static_cast<int>(event.GetY() + scroll_));
+  const wxPoint way = now - *pressed_;
+  if (!banding_ && std::abs(way.x) + std::abs(way.y) < FromDIP(6)) return;
+  if (pressedLine_ != kNoLine) {
+    if (HasCapture()) ReleaseMouse();
+    pressed_.reset();
+    if (events_.dragBegins) events_.dragBegins();
+    return;
+  }
+  Selection& selection = model_.Selected();
+  if (!banding_) {
+    selection.BeginBand(event.ControlDown() || event.ShiftDown());
+    banding_ = true;
+    bandTimer_.Start(40);
+  }
+  bandEnd_ = now;
+  const Rect band{std::min(pressed_->x, now.x), std::min(pressed_->y, now.y), std::abs(way.x) + 1, std::abs(way.y) + 1};
+  selection.MoveBand(layout_.LinesIn(band));
+  TellSelection();
+}
+
+void ThumbnailCanvas::OnDoubleClick(wxMouseEvent& event) {
+  const size_t line = LineAt(event.GetPosition());
+  if (line != kNoLine && events_.activated) events_.activated(line);
+}
+
+void ThumbnailCanvas::OnRightDown(wxMouseEvent& event) {
+  FinishEdit(true);
+  SetFocus();
+  const size_t line = LineAt(event.GetPosition());
+  model_.Selected().ContextClick(line);
+  if (line == kNoLine) model_.Selected().ClickBlank(settings.ClearAllOnBlankClick != 0);
+  TellSelection();
+  if (events_.contextMenu) events_.contextMenu(line, event.GetPosition());
+}
+
+void ThumbnailCanvas::UpdateTip(size_t line) {
+  if (line == tipLine_) return;
+  tipLine_ = line;
+  if (line == kNoLine || line >= model_.LineCount() || settings.FileTipShow == 0) return UnsetToolTip();
+  const FolderItem& item = model_.Line(line);
+  if (item.folder) return SetToolTip(Shown(item.name));
+  wxString tip = Shown(item.name) + "\n" + Shown(DescribeFileType(item.name));
+  const ThumbnailPointer thumbnail = thumbnails_.FindAny(model_.PathOfLine(line));
+  if (thumbnail != nullptr && thumbnail->status != Status::Ok) tip += "\n" + Shown(StatusMessage(thumbnail->status));
+  if (item.width > 0) tip += wxString::Format("\n%d x %d pixels, %d bits", item.width, item.height, item.bits);
+  tip += "\n" + Shown(SizeText(item.size, choice::kSizeFitting) + ", " + DateText(item.modified));
+  SetToolTip(tip);
+}
+
+// --- keyboard ---
+
+void ThumbnailCanvas::MoveFocus(Step step, const wxKeyEvent& event) {
+  const size_t line = layout_.Move(model_.Selected().Focus(), step);
+  if (line == kNoLine) return;
+  model_.Selected().MoveFocus(line, event.ShiftDown(), event.ControlDown());
+  ShowLine(line);
+  TellSelection();
+}
+
+void ThumbnailCanvas::OnKey(wxKeyEvent& event) {
+  struct KeyStep {
+    int key;
+    Step step;
+  };
+  constexpr KeyStep kSteps[] = {
+      {WXK_LEFT, Step::Left}, {WXK_RIGHT, Step::Right},   {WXK_UP, Step::Up},           {WXK_DOWN, Step::Down},
+      {WXK_HOME, Step::First}, {WXK_END, Step::Last}, {WXK_PAGEUP, Step::PageUp}, {WXK_PAGEDOWN, Step::PageDown},
+  };
+  if (event.AltDown()) return event.Skip();
+  for (const KeyStep& row : kSteps) {
+    if (row.key == event.GetKeyCode()) return MoveFocus(row.step, event);
+  }
+  const size_t focus = model_.Selected().Focus();
+  if (event.GetKeyCode() == WXK_WINDOWS_MENU && focus != kNoLine && events_.contextMenu) {
+    const Rect cell = layout_.Cell(focus);
+    return events_.contextMenu(focus, wxPoint(cell.x + cell.width / 2, static_cast<int>(cell.y - scroll_) + cell.height / 2));
+  }
+  const bool enter = event.GetKeyCode() == WXK_RETURN || event.GetKeyCode() == WXK_NUMPAD_ENTER;
+  if (enter && !event.HasAnyModifiers() && focus != kNoLine) return events_.activated(focus);
+  if (event.GetKeyCode() == WXK_SPACE && typed_.empty()) {
+    model_.Selected().ToggleFocus();
+    return TellSelection();
+  }
+  event.Skip();
+}
+
+// Letters jump to the next name that begins with what was typed.
+void ThumbnailCanvas::OnChar(wxKeyEvent& event) {
+  const wxChar key = event.GetUnicodeKey();
+  if (key < 0x20 || key == 0x7f || event.HasModifiers()) return event.Skip();
+  const double now = platform::MonotonicSeconds();
+  if (now - typedAt_ > kTypingPause) typed_.clear();
+  typedAt_ = now;
+  const std::string letter = Utf8(wxString(key));
+  const bool again = typed_ == letter;
+  if (!again) typed_ += letter;
+  const size_t line = model_.FindTyped(typed_, typed_ == letter);
+  if (line == kNoLine) return;
+  model_.Selected().MoveFocus(line, false, false);
+  ShowLine(line);
+  TellSelection();
+}
+
+// --- renaming in place ---
+
+void ThumbnailCanvas::EditName(size_t line) {
+  FinishEdit(true);
+  if (line >= model_.LineCount()) return;
+  ShowLine(line);
+  const Rect cell = layout_.Cell(line);
+  const std::string& name = model_.Line(line).name;
+  const int height = textHeight_ + FromDIP(12);
+  const int top = static_cast<int>(cell.y - scroll_) + cell.height - height;
+  editedLine_ = line;
+  editor_ = new wxTextCtrl(this, wxID_ANY, Shown(name), wxPoint(cell.x, top), wxSize(std::max(cell.width, FromDIP(160)), height),
+                           wxTE_PROCESS_ENTER, wxDefaultValidator, "New name");
+  editor_->Bind(wxEVT_TEXT_ENTER, [this](wxCommandEvent&) { CallAfter([this] { FinishEdit(true); }); });
+  editor_->Bind(wxEVT_KILL_FOCUS, [this](wxFocusEvent& event) {
+    CallAfter([this] { FinishEdit(true); });
+    event.Skip();
+  });
+  editor_->Bind(wxEVT_KEY_DOWN, [this](wxKeyEvent& event) {
+    if (event.GetKeyCode() != WXK_ESCAPE) return event.Skip();
+    CallAfter([this] { FinishEdit(false); });
+  });
+  editor_->SetFocus();
+  const size_t base = model_.Line(line).folder ? name.size() : name.size() - platform::SplitPath(name).extension.size();
+  editor_->SetSelection(0, static_cast<long>(Shown(std::string_view(name).substr(0, base)).length()));
+}
+
+void ThumbnailCanvas::FinishEdit(bool accept) {
+  if (editor_ == nullptr) return;
+  wxTextCtrl* editor = std::exchange(editor_, nullptr);
+  const size_t line = std::exchange(editedLine_, kNoLine);
+  const std::string name = Utf8(editor->GetValue());
+  const bool hadFocus = editor->HasFocus();
+  editor->Hide();
+  editor->Destroy();
+  if (hadFocus) SetFocus();
+  Refresh();
+  const bool changed = line < model_.LineCount() && editor->IsModified() && name != model_.Line(line).name;
+  if (accept && changed && !name.empty() && events_.renamed) events_.renamed(line, name);
+}
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,25 @@
+#include "desktop/windows/thumbnail_service.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+constexpr uint64_t kCacheBytes = 256ull * 1024 * 1024;
+
+}  // namespace
+
+ThumbnailService::ThumbnailService()
+    : cache_(kCacheBytes),
+      loader_(std::make_unique<ThumbnailLoader>(WorkerCount(), [this] { CallAfter([this] { TakeResults(); }); })) {}
+
+ThumbnailService::~ThumbnailService() {
+  loader_.reset();  // before its events' handler goes
+}
+
+void ThumbnailService::TakeResults() {
+  const std::vector<ThumbnailLoader::Result> results = loader_->TakeResults();
+  for (const ThumbnailLoader::Result& result : results) cache_.Put(result.wish, result.thumbnail);
+  if (listener_ && !results.empty()) listener_(results);
+}
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,185 @@
+#include "desktop/browser_model.h"
+
+#include <gtest/gtest.h>
+
+#include "core/choice_lists.h"
+#include "desktop/cell_layout.h"
+#include "desktop/natural_order.h"
+
+namespace fotomill::desktop {
+namespace {
+
+TEST(NaturalOrder, NumbersCountAsNumbers) {
+  const char* const inOrder[] = {"", "1", "2.png", "10.png", "010.pngx", "a1b2", "a1b10", "B", "b2", "c"};
+  for (size_t i = 0; i + 1 < std::size(inOrder); ++i) {
+    SCOPED_TRACE(inOrder[i]);
+    EXPECT_LT(CompareNatural(inOrder[i], inOrder[i + 1]), 0);
+    EXPECT_GT(CompareNatural(inOrder[i + 1], inOrder[i]), 0);
+  }
+  // Numbers longer than any integer, and names that differ in case or zeros only, still have one order.
+  EXPECT_LT(CompareNatural("99999999999999999999999", "100000000000000000000000"), 0);
+  EXPECT_NE(CompareNatural("A", "a"), 0);
+  EXPECT_NE(CompareNatural("a01", "a1"), 0);
+}
+
+TEST(Filter, PartsAndWildcards) {
+  struct {
+    const char* name;
+    const char* pattern;
+    bool matches;
+  } const rows[] = {
+      {"Beach.JPG", "", true},        {"Beach.JPG", "each", true},  {"Beach.JPG", "*.jpg", true}, {"Beach.JPG", "jpg*", false},
+      {"Beach.JPG", "b?ach.*", true}, {"Beach.JPG", "b?ach", false}, {"aab", "*a*b", true},        {"aaab", "*ab", true},
+      {"x", "**", true},              {"x", "xy", false},
+  };
+  for (const auto& row : rows) EXPECT_EQ(MatchesFilter(row.name, row.pattern), row.matches) << row.name << " " << row.pattern;
+}
+
+std::vector<FolderItem> Items(std::initializer_list<const char*> names) {
+  std::vector<FolderItem> items;
+  for (const char* name : names) {
+    FolderItem item;
+    item.name = name;
+    item.folder = item.name.find('.') == std::string::npos;
+    item.size = 100 * items.size();
+    items.push_back(item);
+  }
+  return items;
+}
+
+// Names of the lines, selected ones with a star, the focused one in brackets.
+std::string Shown(const BrowserModel& model) {
+  std::string text;
+  for (size_t line = 0; line < model.LineCount(); ++line) {
+    const std::string name = model.Line(line).name + (model.Selected().IsSelected(line) ? "*" : "");
+    text += (text.empty() ? "" : " ") + (model.Selected().Focus() == line ? "[" + name + "]" : name);
+  }
+  return text;
+}
+
+TEST(BrowserModel, SelectionSurvivesOrderFilterAndListing) {
+  BrowserModel model;
+  model.SetFolder("/p");
+  model.SetItems(Items({"b10.png", "sub", "b2.png", "a.gif"}));
+  EXPECT_EQ(Shown(model), "sub a.gif b2.png b10.png");
+  model.Selected().Click(1, false, false);
+  model.Selected().Click(3, true, false);
+  EXPECT_EQ(Shown(model), "sub a.gif* b2.png* [b10.png*]");
+  model.SetSort(choice::kSortSize, false);
+  EXPECT_EQ(Shown(model), "sub [b10.png*] b2.png* a.gif*");
+  model.SetSort(choice::kSortSize, true);
+  EXPECT_EQ(Shown(model), "sub a.gif* b2.png* [b10.png*]");  // folders first, whatever the direction
+  model.SetFilter("*.png");
+  EXPECT_EQ(Shown(model), "b2.png* [b10.png*]");
+  model.SetSort(choice::kSortName, false);
+  model.SetFilter("");
+  EXPECT_EQ(Shown(model), "sub a.gif* b2.png* [b10.png*]");
+  EXPECT_EQ(model.FilesForFunction(), (std::vector<std::string>{"/p/a.gif", "/p/b2.png", "/p/b10.png"}));
+  model.SetItems(Items({"b10.png", "c.gif", "b2.png", "sub"}));
+  EXPECT_EQ(Shown(model), "sub b2.png* [b10.png*] c.gif");
+}
+
+TEST(BrowserModel, FocusGoesToTheNextFileWhenItsFileHasGone) {
+  BrowserModel model;
+  model.SetItems(Items({"a.png", "b.png", "c.png"}));
+  model.Selected().SelectOnly(1);
+  model.SetItems(Items({"a.png", "c.png"}));
+  EXPECT_EQ(Shown(model), "a.png [c.png*]");
+  model.SetItems(Items({"a.png"}));
+  EXPECT_EQ(Shown(model), "[a.png*]");
+  model.SetItems({});
+  EXPECT_TRUE(model.FilesForFunction().empty());
+  EXPECT_EQ(model.CountText(), "0 files");
+}
+
+TEST(BrowserModel, KnownFactsStayWithUnchangedFiles) {
+  BrowserModel model;
+  model.SetItems(Items({"a.png"}));
+  FolderItem known = model.Item(0);
+  known.width = 7;
+  model.SetFacts(0, known);
+  model.SetItems(Items({"a.png"}));
+  EXPECT_EQ(model.Item(0).width, 7);
+  auto changed = Items({"a.png"});
+  changed[0].modified = 5;
+  model.SetItems(changed);
+  EXPECT_EQ(model.Item(0).width, 0);
+}
+
+TEST(BrowserModel, TypingFinds) {
+  BrowserModel model;
+  model.SetItems(Items({"ab.png", "ac.png", "b.png", "Ad.png"}));
+  model.Selected().MoveFocus(0, false, true);
+  EXPECT_EQ(model.FindTyped("a", true), 1u);
+  EXPECT_EQ(model.FindTyped("ac", false), 1u);
+  EXPECT_EQ(model.FindTyped("ad", false), 2u);
+  EXPECT_EQ(model.FindTyped("x", true), kNoLine);
+  EXPECT_EQ(model.CountText(), "4 files, 600 bytes");
+}
+
+TEST(Selection, MouseAndKeyboard) {
+  Selection selection;
+  selection.Reset(8);
+  const auto lines = [&] { return selection.SelectedLines(); };
+  using Lines = std::vector<size_t>;
+  selection.Click(2, false, false);
+  selection.Click(5, true, false);
+  EXPECT_EQ(lines(), (Lines{2, 3, 4, 5}));
+  selection.Click(1, true, false);  // the anchor stays
+  EXPECT_EQ(lines(), (Lines{1, 2}));
+  selection.Click(6, false, true);
+  selection.Click(7, true, true);
+  EXPECT_EQ(lines(), (Lines{1, 2, 6, 7}));
+  selection.Click(6, false, true);
+  EXPECT_EQ(lines(), (Lines{1, 2, 7}));
+  selection.MoveFocus(3, false, true);  // the focus alone
+  EXPECT_EQ(lines(), (Lines{1, 2, 7}));
+  selection.ToggleFocus();
+  selection.MoveFocus(4, true, false);
+  EXPECT_EQ(lines(), (Lines{3, 4}));
+  selection.ContextClick(4);
+  EXPECT_EQ(lines(), (Lines{3, 4}));
+  selection.ContextClick(0);
+  EXPECT_EQ(lines(), (Lines{0}));
+  selection.Invert();
+  EXPECT_EQ(selection.SelectedCount(), 7u);
+  selection.SelectOnly(1);
+  selection.BeginBand(true);
+  selection.MoveBand(Lines{4, 5});
+  selection.MoveBand(Lines{5, 99});
+  EXPECT_EQ(lines(), (Lines{1, 5}));
+}
+
+TEST(CellLayout, HundredThousandCells) {
+  CellLayout layout;
+  layout.SetCells(100, 120, 4);
+  layout.SetCount(100'001);
+  layout.SetWindow(550, 400);  // 5 columns, 26 pixels to spare
+  EXPECT_EQ(layout.Columns(), 5);
+  EXPECT_EQ(layout.Rows(), 20'001);
+  const Rect last = layout.Cell(100'000);
+  EXPECT_EQ(layout.LineAt(last.x, last.y), 100'000u);
+  EXPECT_EQ(layout.LineAt(last.x - 3, last.y), kNoLine);
+  EXPECT_EQ(layout.LineAt(last.x + 200, last.y), kNoLine);  // beyond the last one
+  const auto end = layout.Visible(layout.LargestScroll());
+  EXPECT_EQ(end.end, 100'001u);
+  EXPECT_LE(end.end - end.first, 25u);
+  EXPECT_EQ(layout.LinesIn({0, 0, 220, 130}), (std::vector<size_t>{0, 1, 5, 6}));
+
+  struct {
+    size_t from;
+    Step step;
+    size_t to;
+  } const rows[] = {
+      {0, Step::Left, 0},   {0, Step::Up, 0},        {3, Step::Up, 3},           {7, Step::Up, 2},
+      {4, Step::Right, 5},  {2, Step::PageDown, 17}, {17, Step::PageUp, 2},      {7, Step::PageUp, 2},
+      {kNoLine, Step::Down, 0}, {99'999, Step::Down, 100'000}, {100'000, Step::Down, 100'000}, {5, Step::Last, 100'000},
+  };
+  for (const auto& row : rows) EXPECT_EQ(layout.Move(row.from, row.step), row.to) << row.from << " " << static_cast<int>(row.step);
+  EXPECT_EQ(layout.ScrollToShow(0, 5000), 0);
+  EXPECT_EQ(layout.ScrollToShow(100'000, 0), layout.LargestScroll());
+  EXPECT_EQ(layout.ScrollToShow(6, 30), 30);
+}
+
+}  // namespace
+}  // namespace fotomill::desktop

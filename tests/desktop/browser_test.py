@@ -1,0 +1,61 @@
+#!/usr/bin/env python3
+"""The browser and the view window of the real program, by keyboard."""
+from driven_desktop import Desktop, make_pictures, run
+
+NAMES = ["a1.bmp", "a2.png", "a10.jpg", "b.tif"]
+
+
+def open_select_view(folder):
+    pictures = folder / "pictures"
+    make_pictures(pictures, NAMES)
+    (pictures / "broken.gif").write_bytes(b"GIF89a and no more")
+    (pictures / "sub").mkdir()
+    with Desktop(folder, pictures) as desktop:
+        desktop.wait(r"browser tabs=1 lines=6 items=6 selected=0 missing=0 listing=0")
+        desktop.screenshot("browser")
+        desktop.focus("Fotomill Professional")
+        # Numbers in names count: a1, a2, a10.
+        desktop.key("Home", "Right", "Right")
+        desktop.wait(r"selected=1 .*focus=a2.png")
+        desktop.key("shift+Right")
+        desktop.wait(r"selected=2 .*focus=a10.jpg")
+        desktop.key("ctrl+a")
+        desktop.wait(r"selected=6")
+        desktop.key("ctrl+i")
+        desktop.wait(r"selected=0")
+        desktop.key("b", "r")
+        desktop.wait(r"selected=1 .*focus=broken.gif")
+        # A changed folder shows itself.
+        make_pictures(pictures, ["c.bmp"])
+        desktop.wait(r"lines=7 .*listing=0 .*focus=broken.gif")
+        desktop.key("ctrl+f")
+        desktop.type("a?.")
+        desktop.wait(r"lines=0 items=7")
+        desktop.key("BackSpace", "asterisk")
+        desktop.wait(r"lines=3 items=7")
+        desktop.key("Escape")
+        desktop.wait(r"lines=7 items=7")
+        desktop.key("ctrl+2")
+        desktop.wait(r"view=1")
+        desktop.screenshot("details")
+        desktop.key("ctrl+5")
+        desktop.wait(r"missing=0 .*view=4")
+        desktop.key("Home", "Right", "Return")
+        desktop.wait(r"view place=1/6 .*status=0 .*a1.bmp")
+        desktop.focus("View")
+        desktop.key("space")
+        desktop.wait(r"view place=2/6 .*status=0 .*a2.png")
+        desktop.key("plus", "1", "0")
+        desktop.screenshot("view")
+        desktop.key("End")
+        desktop.wait(r"view place=6/6 .*c.bmp")
+        desktop.key("BackSpace", "BackSpace")
+        desktop.wait(r"view place=4/6 .*status=2 .*broken.gif|view place=4/6 .*b.tif")
+        desktop.key("Escape")
+        desktop.wait(r"browser .*selected=1 ")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+q")
+        desktop.wait_end()
+
+
+run(open_select_view)

@@ -1,0 +1,198 @@
+"""Drives the real desktop program on a display of its own: keys and mouse go in, its event log comes out.
+
+Tests wait for what the log tells, never for a time. Each test gets its own display, data folder and home; screenshots
+are kept in build/screenshots.
+"""
+import os
+import re
+import shutil
+import struct
+import subprocess
+import sys
+import tempfile
+import time
+import zlib
+from pathlib import Path
+
+PROJECT = Path(__file__).resolve().parents[2]
+PATIENCE = 60  # seconds until a test gives up waiting
+
+
+class Failure(Exception):
+    pass
+
+
+def skip_without_display():
+    for program in ("Xvfb", "xdotool"):
+        if shutil.which(program) is None:
+            print(f"{program} is not installed: left out")
+            sys.exit(77)
+
+
+class Desktop:
+    """The program with a display. `arguments` and `settings` (lines of the configuration file) as it starts."""
+
+    def __init__(self, folder, *arguments, settings=(), size=(1280, 900)):
+        self.folder = Path(folder)
+        self.arguments = [str(argument) for argument in arguments]
+        self.size = size
+        self.data = self.folder / "data"
+        self.data.mkdir(exist_ok=True)
+        if settings:
+            text = "[Fotomill]\n" + "".join(line + "\n" for line in settings)
+            (self.data / "Fotomill Professional 11.ini").write_text(text)
+        self.log = self.folder / "log"
+        self.seen = 0
+
+    def __enter__(self):
+        skip_without_display()
+        self.frames = tempfile.TemporaryDirectory()
+        reader, writer = os.pipe()
+        self.server = subprocess.Popen(
+            ["Xvfb", "-displayfd", str(writer), "-screen", "0", f"{self.size[0]}x{self.size[1]}x24", "-fbdir", self.frames.name,
+             "-nolisten", "tcp", "-noreset"], pass_fds=[writer], stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL)
+        os.close(writer)
+        with os.fdopen(reader) as line:
+            number = line.readline().strip()
+        if not number:
+            raise Failure("Xvfb did not start")
+        home = self.folder / "home"
+        home.mkdir(exist_ok=True)
+        self.environment = dict(
+            os.environ, DISPLAY=":" + number, HOME=str(home), XDG_DATA_HOME=str(home / ".local/share"), XDG_CONFIG_HOME=str(home / ".config"),
+            FOTOMILL_DATA=str(self.data), FOTOMILL_DESKTOP_LOG=str(self.log), GDK_BACKEND="x11", NO_AT_BRIDGE="1", LC_ALL="C.UTF-8",
+            GTK_THEME="Adwaita", ASAN_OPTIONS=os.environ.get("ASAN_OPTIONS", "") + ":detect_leaks=0")
+        self.start()
+        return self
+
+    def __exit__(self, kind, error, trace):
+        if kind is not None:
+            print(self.log_text()[-3000:], file=sys.stderr)
+            print(self.output.read_text()[-3000:], file=sys.stderr)
+            self.screenshot("failed-" + Path(sys.argv[0]).stem)
+        if self.program.poll() is None:
+            self.program.terminate()
+            try:
+                self.program.wait(10)
+            except subprocess.TimeoutExpired:
+                self.program.kill()
+        self.server.terminate()
+        self.server.wait()
+        self.frames.cleanup()
+
+    def start(self):
+        program = os.environ.get("FOTOMILL_DESKTOP", str(PROJECT / "build/release/fotomill-desktop"))
+        self.output = self.folder / "output"
+        self.log.write_text("")
+        self.seen = 0
+        with self.output.open("w") as output:
+            self.program = subprocess.Popen([program, *self.arguments], env=self.environment, stdout=output, stderr=output,
+                                            stdin=subprocess.DEVNULL)
+
+    # --- what comes out ---
+
+    def log_text(self):
+        return self.log.read_text(errors="replace")
+
+    def wait(self, pattern, again=False):
+        """The first line from here on that matches; from the last one found on when `again`."""
+        end = time.monotonic() + PATIENCE
+        while time.monotonic() < end:
+            text = self.log_text()
+            for match in re.finditer(r"^\S+ (.*)$", text[self.seen:], re.M):
+                if re.search(pattern, match.group(1)):
+                    if not again:
+                        self.seen += match.end()
+                    return match.group(1)
+            if self.program.poll() is not None:
+                raise Failure(f"the program ended with {self.program.returncode}, waiting for {pattern}")
+            time.sleep(0.03)
+        raise Failure(f"waited in vain for {pattern}")
+
+    def wait_end(self):
+        status = self.program.wait(PATIENCE)
+        if status != 0:
+            raise Failure(f"the program ended with {status}")
+
+    # --- what goes in ---
+
+    def xdotool(self, *arguments):
+        done = subprocess.run(["xdotool", *map(str, arguments)], env=self.environment, capture_output=True, text=True)
+        return done.stdout.split()
+
+    def focus(self, title):
+        """Gives the keyboard to the window of a title: there is no window manager to do it."""
+        end = time.monotonic() + PATIENCE
+        while time.monotonic() < end:
+            windows = self.xdotool("search", "--onlyvisible", "--name", title)
+            if windows:
+                self.xdotool("windowraise", windows[-1])
+                self.xdotool("windowfocus", "--sync", windows[-1])
+                return windows[-1]
+            time.sleep(0.05)
+        raise Failure(f"there is no window {title}")
+
+    def key(self, *keys):
+        self.xdotool("key", "--delay", "20", *keys)
+
+    def type(self, text):
+        self.xdotool("type", "--delay", "20", text)
+
+    def screenshot(self, name):
+        place = PROJECT / "build/screenshots"
+        place.mkdir(parents=True, exist_ok=True)
+        (place / (name + ".png")).write_bytes(png_of_xwd((Path(self.frames.name) / "Xvfb_screen0").read_bytes()))
+
+
+def png_of_xwd(data):
+    """A PNG of the frame buffer that Xvfb keeps as an X window dump of 32 bits a pixel."""
+    header_size, _, _, _, width, height = struct.unpack(">6I", data[:24])
+    stride, = struct.unpack(">I", data[48:52])
+    colors, = struct.unpack(">I", data[76:80])
+    start = header_size + 12 * colors
+    rows = bytearray()
+    for y in range(height):
+        row = data[start + y * stride:start + y * stride + 4 * width]
+        rgb = bytearray(3 * width)
+        rgb[0::3], rgb[1::3], rgb[2::3] = row[2::4], row[1::4], row[0::4]
+        rows += b"\0" + rgb
+
+    def chunk(kind, body):
+        return struct.pack(">I", len(body)) + kind + body + struct.pack(">I", zlib.crc32(kind + body))
+
+    head = struct.pack(">2I5B", width, height, 8, 2, 0, 0, 0)
+    return b"\x89PNG\r\n\x1a\n" + chunk(b"IHDR", head) + chunk(b"IDAT", zlib.compress(bytes(rows), 6)) + chunk(b"IEND", b"")
+
+
+def run(*tests):
+    """Runs test functions of a folder each; exits with their outcome."""
+    skip_without_display()
+    failed = 0
+    for test in tests:
+        with tempfile.TemporaryDirectory() as folder:
+            try:
+                test(Path(folder))
+                print(f"{test.__name__}: ok")
+            except (Failure, AssertionError) as failure:
+                failed += 1
+                print(f"{test.__name__}: {failure or 'assertion failed'}")
+                if isinstance(failure, AssertionError):
+                    import traceback
+                    traceback.print_exc()
+    sys.exit(1 if failed else 0)
+
+
+def make_pictures(folder, names):
+    """Small pictures of different colours, made from a sample by the command line."""
+    folder.mkdir(exist_ok=True)
+    sample = PROJECT / "samples/bmp-true-colour.bmp"
+    for name in names:
+        target = folder / name
+        if target.suffix == ".bmp":
+            shutil.copy(sample, target)
+        else:
+            program = os.environ.get("FOTOMILL", str(PROJECT / "build/release/fotomill"))
+            made = folder / ("bmp-true-colour" + target.suffix)
+            subprocess.run([program, "convert", str(sample), "--to", target.suffix[1:], "--dest", str(folder)], check=True,
+                           stdout=subprocess.DEVNULL)
+            made.rename(target)

@@ -1,0 +1,142 @@
+#include <gtest/gtest.h>
+
+#include <atomic>
+#include <condition_variable>
+
+#include "core/settings.h"
+#include "desktop/thumbnail_loader.h"
+#include "desktop/view_picture.h"
+#include "desktop/view_transform.h"
+
+namespace fotomill::desktop {
+namespace {
+
+TEST(ViewTransform, FitsAndZoomsAtThePointer) {
+  ViewTransform view;
+  view.SetPicture(400, 200);
+  view.SetWindow(200, 200);
+  EXPECT_EQ(view.Scale(), 0.5);
+  EXPECT_EQ(view.X(), 0);
+  EXPECT_EQ(view.Y(), 50);
+  view.SetMode(ZoomMode::Fill);
+  EXPECT_EQ(view.ShownHeight(), 200);
+  EXPECT_EQ(view.X(), -100);
+  // The picture's point under the pointer stays there.
+  view.ZoomTo(4, 50, 150);
+  EXPECT_EQ(view.X(), 50 - 4 * 150);
+  EXPECT_EQ(view.Y(), 150 - 4 * 150);
+  view.Pan(10'000, -10'000);
+  EXPECT_EQ(view.X(), 0);
+  EXPECT_EQ(view.Y(), 200 - 800);
+  view.ZoomTo(0.00001, 0, 0);
+  EXPECT_EQ(view.ShownWidth(), 4);
+  // A small picture is not enlarged to fit, unless that is asked for.
+  view.SetPicture(10, 10);
+  view.SetMode(ZoomMode::Fit);
+  EXPECT_EQ(view.Scale(), 1);
+}
+
+PackedImage Ramp(int32_t width, int32_t height) {
+  PackedImage image;
+  EXPECT_EQ(NewPackedImage(width, height, nullptr, 24, image), Status::Ok);
+  for (int32_t y = 0; y < height; ++y) {
+    for (int32_t x = 0; x < 3 * width; ++x) image.Row(y)[static_cast<size_t>(x)] = static_cast<uint8_t>(40 * y + x);
+  }
+  return image;
+}
+
+// Green of the pixels of a row of the canvas, the blue ones of the background as 255.
+std::vector<int> Greens(const RgbImage& canvas, int32_t y) {
+  std::vector<int> values;
+  for (int32_t x = 0; x < canvas.width; ++x) values.push_back(canvas.Row(y)[3 * x + 1]);
+  return values;
+}
+
+TEST(DrawView, PlacesCopiesAndSamples) {
+  const PackedImage image = Ramp(2, 2);  // greens 1 4 / 41 44
+  RgbImage canvas = FilledImage(6, 4, 0);
+  ViewTransform view;
+  view.SetPicture(2, 2);
+  view.SetWindow(6, 4);
+  DrawView(image, view, 0x00ff00, true, canvas);
+  EXPECT_EQ(Greens(canvas, 0), (std::vector<int>{255, 255, 255, 255, 255, 255}));
+  EXPECT_EQ(Greens(canvas, 1), (std::vector<int>{255, 255, 1, 4, 255, 255}));
+  EXPECT_EQ(canvas.Row(1)[6], 2);  // red comes first
+  view.ZoomToMiddle(2);
+  DrawView(image, view, 0x00ff00, false, canvas);
+  EXPECT_EQ(Greens(canvas, 0), (std::vector<int>{255, 1, 1, 4, 4, 255}));
+  EXPECT_EQ(Greens(canvas, 2), (std::vector<int>{255, 41, 41, 44, 44, 255}));
+  DrawView(image, view, 0x00ff00, true, canvas);
+  EXPECT_EQ(Greens(canvas, 0), (std::vector<int>{255, 1, 2, 3, 4, 255}));
+  // Far zoomed in and panned to the end, nothing is read beyond the picture.
+  view.ZoomTo(64, 0, 0);
+  view.Pan(-1000, -1000);
+  DrawView(image, view, 0, true, canvas);
+  EXPECT_EQ(Greens(canvas, 3), (std::vector<int>(6, 44)));
+}
+
+TEST(Thumbnail, MatteIsCutOff) {
+  RgbImage square = FilledImage(6, 6, 0x112233);
+  for (int32_t y = 2; y < 4; ++y) square.Row(y)[3] = 9;  // a picture of 4 by 2 whose right side has the matte's colour
+  const RgbImage cut = WithoutMatte(square, 0x112233);
+  EXPECT_EQ(cut.width, 4);
+  EXPECT_EQ(cut.height, 2);
+  EXPECT_EQ(cut.Row(0)[0], 9);
+  EXPECT_GT(WithoutMatte(FilledImage(6, 6, 0x112233), 0x112233).width, 0);
+}
+
+std::mutex gate;
+std::condition_variable opened;
+std::atomic<int> loads{0};
+bool open = false;
+
+ThumbnailPointer SlowThumbnail(const ThumbnailWish& wish) {
+  ++loads;
+  std::unique_lock lock(gate);
+  opened.wait(lock, [] { return open; });
+  auto thumbnail = std::make_shared<Thumbnail>();
+  thumbnail->width = static_cast<int32_t>(wish.size);
+  return thumbnail;
+}
+
+TEST(ThumbnailLoader, ForgetsWhatIsNoLongerWanted) {
+  std::atomic<int> wakes{0};
+  ThumbnailLoader loader(1, [&] { ++wakes; }, SlowThumbnail);
+  const auto wish = [](const char* path) { return ThumbnailWish{path, 1, 2, 96, 0}; };
+  loader.Want({wish("a"), wish("b"), wish("c")});
+  while (loads == 0) std::this_thread::yield();
+  loader.Want({wish("a"), wish("d")});  // a is in work
+  {
+    const std::lock_guard lock(gate);
+    open = true;
+  }
+  opened.notify_all();
+  while (loads < 2 || loader.Pending() > loader.TakeResults().size()) {
+    if (loads == 2 && loader.Pending() == 0) break;
+    std::this_thread::yield();
+  }
+  EXPECT_EQ(loads, 2);
+  EXPECT_GT(wakes, 0);
+}
+
+TEST(ThumbnailCache, KeepsTheLastUsedWithinItsBytes) {
+  const auto picture = [] {
+    auto thumbnail = std::make_shared<Thumbnail>();
+    thumbnail->pixels = FilledImage(10, 10, 0);
+    return thumbnail;
+  };
+  ThumbnailCache cache(3 * picture()->Bytes());
+  const auto wish = [](const char* path, int64_t modified) { return ThumbnailWish{path, modified, 0, 96, 0}; };
+  for (const char* path : {"a", "b", "c"}) cache.Put(wish(path, 1), picture());
+  EXPECT_NE(cache.Find(wish("a", 1)), nullptr);
+  cache.Put(wish("d", 1), picture());
+  EXPECT_EQ(cache.Count(), 3u);
+  EXPECT_EQ(cache.Find(wish("b", 1)), nullptr);
+  EXPECT_EQ(cache.Find(wish("a", 2)), nullptr);  // the file has changed
+  EXPECT_NE(cache.FindAny("a"), nullptr);
+  cache.Put(wish("a", 2), picture());
+  EXPECT_EQ(cache.Bytes(), 3 * picture()->Bytes());
+}
+
+}  // namespace
+}  // namespace fotomill::desktop
