@@ -226,11 +226,13 @@ class Conversion {
 
   // Metadata that the format cannot hold are not lost in silence, for who wants to know.
   void NoteLostMetadata(const SelectedFile& file, const PictureRecord& picture) {
-    if (!options_.verbose || options_.metadata != "keep" || picture.metadata.Empty() || KeepsMetadata(row_)) return;
+    if (!options_.verbose || options_.metadata != "keep" || picture.lostMetadata == 0) return;
+    const PictureMetadata& metadata = picture.metadata;
     std::string lost;
-    if (!picture.metadata.exif.empty()) lost += ", EXIF";
-    if (!picture.metadata.xmp.empty()) lost += ", XMP";
-    if (!picture.metadata.icc.empty()) lost += ", color profile";
+    if (!metadata.exif.empty() && (picture.lostMetadata & kLostExif) != 0) lost += ", EXIF";
+    if (!metadata.xmp.empty() && (picture.lostMetadata & kLostXmp) != 0) lost += ", XMP";
+    if (!metadata.icc.empty() && (picture.lostMetadata & kLostIcc) != 0) lost += ", color profile";
+    if (lost.empty()) return;
     output_.Note(output_.ShownMessage(file.name) + ": " + std::string(row_.extension.view()) + " cannot hold its " +
                  lost.substr(2) + ".");
   }

@@ -327,33 +327,36 @@ void SetParameters(JpegWriter& writer, const PictureRecord& picture, bool grey) 
   }
 }
 
-// One segment of a heading and data; what does not fit one is left out.
-void WriteSegment(jpeg_compress_struct& info, int marker, std::string_view head, std::span<const uint8_t> data) {
-  if (data.empty() || head.size() + data.size() > kMostSegment) return;
+// One segment of a heading and data. False, without a trace, when there is too much for one.
+bool WriteSegment(jpeg_compress_struct& info, int marker, std::string_view head, std::span<const uint8_t> data) {
+  if (data.empty()) return true;
+  if (head.size() + data.size() > kMostSegment) return false;
   jpeg_write_m_header(&info, marker, static_cast<unsigned>(head.size() + data.size()));
   for (const char c : head) jpeg_write_m_byte(&info, static_cast<uint8_t>(c));
   for (const uint8_t byte : data) jpeg_write_m_byte(&info, byte);
+  return true;
 }
 
-void WriteProfile(jpeg_compress_struct& info, std::span<const uint8_t> profile) {
+bool WriteProfile(jpeg_compress_struct& info, std::span<const uint8_t> profile) {
   constexpr size_t kPiece = kMostSegment - 14;
   const size_t pieces = (profile.size() + kPiece - 1) / kPiece;
-  if (pieces > 255) return;
+  if (pieces > 255) return false;
   for (size_t i = 0; i < pieces; ++i) {
     char head[14];
     std::copy(kIccHead.begin(), kIccHead.end(), head);
     head[12] = static_cast<char>(i + 1);
     head[13] = static_cast<char>(pieces);
     const auto piece = profile.subspan(i * kPiece, std::min(kPiece, profile.size() - i * kPiece));
-    WriteSegment(info, kApp2, {head, sizeof head}, piece);
+    (void)WriteSegment(info, kApp2, {head, sizeof head}, piece);  // pieces fit
   }
+  return true;
 }
 
-void WriteMetadata(jpeg_compress_struct& info, const PictureRecord& picture) {
-  WriteSegment(info, kApp1, kExifHead, picture.metadata.exif);
-  WriteSegment(info, kApp1, kXmpHead, picture.metadata.xmp);
-  WriteProfile(info, picture.metadata.icc);
-  WriteSegment(info, JPEG_COM, {}, picture.comment);
+void WriteMetadata(jpeg_compress_struct& info, PictureRecord& picture) {
+  if (!WriteSegment(info, kApp1, kExifHead, picture.metadata.exif)) picture.lostMetadata |= kLostExif;
+  if (!WriteSegment(info, kApp1, kXmpHead, picture.metadata.xmp)) picture.lostMetadata |= kLostXmp;
+  if (!WriteProfile(info, picture.metadata.icc)) picture.lostMetadata |= kLostIcc;
+  (void)WriteSegment(info, JPEG_COM, {}, picture.comment);
 }
 
 // A row as the encoder takes it: greys, or blue, green, red.
@@ -374,7 +377,7 @@ void ExpandRow(const PictureRecord& picture, int32_t y, bool grey, std::vector<u
   }
 }
 
-Status WriteAll(JpegWriter& writer, const PictureRecord& picture, bool keep) {
+Status WriteAll(JpegWriter& writer, PictureRecord& picture, bool keep) {
   const PackedImage& image = picture.image;
   const bool grey = HasGreyPalette(picture);
   std::vector<uint8_t> expanded(image.Bits() == 24 ? 0 : (grey ? 1 : 3) * static_cast<size_t>(image.Width()));

@@ -201,7 +201,7 @@ int32_t FrameCount(std::span<const uint8_t> file) {
   return 1;
 }
 
-// Fills the facts and sets up the conversions.
+// Fills the facts.
 Status Describe(PngReader& reader, std::span<const uint8_t> file, PngLayout& layout, PictureRecord& picture) {
   RETURN_IF_BAD(ReadHeader(reader));
   layout = ChooseLayout(reader);
@@ -215,7 +215,7 @@ Status Describe(PngReader& reader, std::span<const uint8_t> file, PngLayout& lay
   picture.imageBytes = EstimateImageBytes(layout.width, layout.height, layout.bitsPerPixel);
   TakePalette(reader, layout, picture.palette);
   TakeMetadata(reader, picture);
-  return Guarded(reader.png, [&] { SetConversions(reader, layout); }) ? Status::Ok : reader.Failure();
+  return Status::Ok;
 }
 
 void SplitAlpha(const uint8_t* source, uint8_t* color, uint8_t* alpha, int32_t width) {
@@ -288,6 +288,8 @@ Status ReadPixels(PngReader& reader, const PngLayout& layout, PictureRecord& pic
   PngTarget target;
   RETURN_IF_BAD(NewPackedImage(layout.width, layout.height, &picture.palette, layout.bitsPerPixel, target.image));
   if (layout.rows == PngRows::WithAlpha) RETURN_IF_BAD(NewAlphaPlane(layout.width, layout.height, target.alpha));
+  // Only now: the library takes memory for rows of whatever width the file claims.
+  if (!Guarded(reader.png, [&] { SetConversions(reader, layout); })) return reader.Failure();
   RETURN_IF_BAD(layout.interlaced ? ReadInterlaced(reader, layout, picture, target)
                                   : ReadInOrder(reader, layout, picture, target));
   picture.image = std::move(target.image);
@@ -331,7 +333,7 @@ int ColorType(const PictureRecord& picture) {
   return IsGrey(picture.palette, bits) ? PNG_COLOR_TYPE_GRAY : PNG_COLOR_TYPE_PALETTE;
 }
 
-void SetMetadata(const PngWriter& writer, const PictureRecord& picture, bool keep) {
+void SetMetadata(const PngWriter& writer, const PictureRecord& picture, bool keep, uint8_t& lost) {
   const PictureMetadata& metadata = picture.metadata;
   if (metadata.dpiX > 0 && metadata.dpiY > 0) {
     png_set_pHYs(writer.png, writer.info, static_cast<png_uint_32>(std::lround(metadata.dpiX * kInchesPerMetre)),
@@ -342,6 +344,7 @@ void SetMetadata(const PngWriter& writer, const PictureRecord& picture, bool kee
     png_set_benign_errors(writer.png, 1);  // an odd profile is left out, not the picture
     png_set_iCCP(writer.png, writer.info, "ICC profile", PNG_COMPRESSION_TYPE_BASE, metadata.icc.data(),
                  static_cast<png_uint_32>(metadata.icc.size()));
+    if (png_get_valid(writer.png, writer.info, PNG_INFO_iCCP) == 0) lost |= kLostIcc;
   }
   if (!metadata.exif.empty()) {
     png_set_eXIf_1(writer.png, writer.info, static_cast<png_uint_32>(metadata.exif.size()),
@@ -383,8 +386,8 @@ void MergeAlpha(const uint8_t* color, const uint8_t* alpha, uint8_t* target, int
   }
 }
 
-// `keep`: whether metadata and comment go along.
-Status WriteAll(PngWriter& writer, const PictureRecord& picture, bool keep) {
+// `keep`: whether metadata and comment go along; `lost`: what of them could not.
+Status WriteAll(PngWriter& writer, const PictureRecord& picture, bool keep, uint8_t& lost) {
   const PackedImage& image = picture.image;
   const std::string xmp(picture.metadata.xmp.begin(), picture.metadata.xmp.end());
   const std::string comment(picture.comment.begin(), picture.comment.end());
@@ -392,7 +395,7 @@ Status WriteAll(PngWriter& writer, const PictureRecord& picture, bool keep) {
   const bool written = Guarded(writer.png, [&] {
     png_set_write_fn(writer.png, &writer, WriteBytes, FlushNothing);
     SetHeader(writer, picture);
-    SetMetadata(writer, picture, keep);
+    SetMetadata(writer, picture, keep, lost);
     if (keep && !xmp.empty()) SetText(writer, kXmpKeyword, xmp);
     if (keep && !comment.empty()) SetText(writer, "Comment", comment);
     png_write_info(writer.png, writer.info);
@@ -482,7 +485,8 @@ Status DecodePng(std::span<const uint8_t> file, PictureRecord& picture) {
 Status EncodePng(const PictureRecord& picture, ByteWriter& out) {
   PngWriter writer(out);
   if (!writer.Ready()) return Status::MemoryAllocationError;
-  return WriteAll(writer, picture, false);
+  uint8_t lost = 0;
+  return WriteAll(writer, picture, false, lost);
 }
 
 Status PngInfo(PictureRecord& picture, const char* fileName, uint32_t) {
@@ -509,7 +513,7 @@ Status PngWrite(PictureRecord& picture, const WriteOptions& options) {
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
   PngWriter writer(out);
   if (!writer.Ready()) return Status::MemoryAllocationError;
-  RETURN_IF_BAD(WriteAll(writer, picture, options.keepMetadata && settings.PreserveEXIF != 0));
+  RETURN_IF_BAD(WriteAll(writer, picture, options.keepMetadata && settings.PreserveEXIF != 0, picture.lostMetadata));
   return CommitOutput(out, options);
 }
 

@@ -9,8 +9,8 @@
 // What the reader makes of it: greys and palettes of 1, 2, 4 and 8 bits keep their depth (2 becomes 4), deeper greys become
 // 8 bits, everything else 24 bits, with an alpha plane where an extra sample says that it is alpha; colours that were
 // multiplied by it are divided again. CMYK is turned into RGB by the usual formula. YCbCr that is not JPEG, CIE L*a*b* and
-// LogLuv come through the library's own conversion. Orientation is not applied here: it travels in an EXIF block of this one
-// entry. XMP, ICC profile, description and resolution travel with the picture.
+// LogLuv come through the library's own conversion. Orientation is not applied here: it travels in the EXIF block, which is
+// gathered from the directories of a camera. XMP, ICC profile, description and resolution travel with the picture as well.
 //
 // A file that ends before its last pixel fails (status 3). A fault inside the data that the decoder passes over is told in
 // the record's `warning`.
@@ -25,6 +25,7 @@
 #include <vector>
 
 #include "core/limits.h"
+#include "formats/exif_directories.h"
 #include "formats/tiff_file.h"
 #include "formats/tiff_samples.h"
 #include "platform/file_view.h"
@@ -187,17 +188,12 @@ void TakeBlock(TIFF* tiff, uint32_t tag, std::vector<uint8_t>& block) {
   block.assign(static_cast<const uint8_t*>(data), static_cast<const uint8_t*>(data) + size);
 }
 
-// An orientation other than the usual one, as a block of one directory with one SHORT.
-void TakeOrientation(TIFF* tiff, std::vector<uint8_t>& exif) {
-  const uint16_t orientation = Field<uint16_t>(tiff, TIFFTAG_ORIENTATION);
-  if (orientation < 2 || orientation > 8) return;
-  exif = {'I', 'I', 42, 0, 8, 0, 0, 0, 1, 0, 0x12, 0x01, 3, 0, 1, 0, 0, 0, static_cast<uint8_t>(orientation), 0, 0, 0, 0, 0, 0, 0};
-}
-
-void TakeMetadata(TIFF* tiff, PictureRecord& picture) {
+void TakeMetadata(const TiffInput& input, PictureRecord& picture) {
+  TIFF* tiff = input.Handle();
   PictureMetadata& metadata = picture.metadata;
   metadata = {};
-  TakeOrientation(tiff, metadata.exif);
+  const DirectoryForm form = {TIFFIsBigEndian(tiff) != 0, TIFFIsBigTIFF(tiff) != 0};
+  metadata.exif = MakePictureBlock(GatherExif(input.Bytes(), form, TIFFCurrentDirOffset(tiff)));
   TakeBlock(tiff, TIFFTAG_XMLPACKET, metadata.xmp);
   TakeBlock(tiff, TIFFTAG_ICCPROFILE, metadata.icc);
   picture.comment.clear();
@@ -231,7 +227,7 @@ Status Describe(TiffInput& input, TiffLayout& layout, PictureRecord& picture) {
   picture.alphaFlags = static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (layout.alpha >= 0 ? kHasAlpha : 0));
   picture.imageBytes = EstimateImageBytes(picture.width, picture.height, picture.bitsPerPixel);
   TakePalette(tiff, layout, picture.palette);
-  TakeMetadata(tiff, picture);
+  TakeMetadata(input, picture);
   return Status::Ok;
 }
 
@@ -486,8 +482,7 @@ void AddDetails(TIFF* tiff, const TiffLayout& layout, const PictureRecord& pictu
   if (orientation > 1) lines.AddFormat("  Orientation: %u", unsigned{orientation});
   if (!metadata.icc.empty()) lines.AddFormat("  ICC profile: %zu bytes", metadata.icc.size());
   if (!metadata.xmp.empty()) lines.AddFormat("          XMP: %zu bytes", metadata.xmp.size());
-  uint64_t exif = 0;
-  if (TIFFGetField(tiff, TIFFTAG_EXIFIFD, &exif) != 0) lines.Add("         EXIF: yes");
+  if (!metadata.exif.empty()) lines.AddFormat("         EXIF: %zu bytes", metadata.exif.size());
   if (picture.pageCount > 1) lines.AddFormat("        Pages: %d", picture.pageCount);
 }
 

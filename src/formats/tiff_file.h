@@ -54,6 +54,9 @@ class TiffOutput {
 
   [[nodiscard]] bool Open();
   TIFF* Handle() const { return tiff_; }
+  // Bytes that the file has; and more of them, which the library knows nothing of.
+  uint64_t End() const { return out_.Position(); }
+  void Append(std::span<const uint8_t> bytes) { out_.Bytes(bytes); }
 
   tmsize_t Write(const void* source, tmsize_t count);
   uint64_t Seek(uint64_t offset, int from);

@@ -1,16 +1,16 @@
 // The TIFF writer: one page, little-endian, in strips compressed as TiffOptions says. Palettes of 1, 4 and 8 bits keep their
 // depth (greys as grey), colours are RGB, with an alpha plane as a separate extra sample. CCITT group 4 takes black and
 // white pictures, JPEG greys of 8 bits and colours without alpha; LZW takes the rest. Resolution is the picture's, else
-// TiffResolution; of an EXIF block, the orientation is kept.
+// TiffResolution. An EXIF block is spread over the file's directories; a thumbnail in it stays behind, as it would be a page.
 #include <algorithm>
 #include <span>
 #include <string>
 #include <vector>
 
-#include "core/byte_reader.h"
 #include "core/choice_lists.h"
 #include "core/creator.h"
 #include "core/settings.h"
+#include "formats/exif_directories.h"
 #include "formats/tiff.h"
 #include "formats/tiff_file.h"
 
@@ -119,39 +119,65 @@ void SetLayout(TIFF* tiff, const PictureRecord& picture, const TiffPlan& plan) {
   TIFFSetField(tiff, TIFFTAG_ROWSPERSTRIP, static_cast<uint32_t>(std::min<uint64_t>(rows, static_cast<uint64_t>(image.Height()))));
 }
 
-// The orientation in the first directory of an EXIF block, 1 when there is none.
-uint16_t OrientationOf(std::span<const uint8_t> exif) {
-  constexpr uint16_t kOrientation = 0x0112;
-  ByteReader bytes(exif);
-  const bool big = bytes.Match("MM");
-  const auto next16 = [&] { return big ? bytes.Be16() : bytes.Le16(); };
-  bytes.Seek(4);
-  bytes.Seek(big ? bytes.Be32() : bytes.Le32());
-  for (uint32_t left = next16(); left > 0 && bytes.Ok(); --left) {
-    const uint16_t tag = next16();
-    bytes.Skip(6);
-    const uint16_t value = next16();
-    bytes.Skip(2);
-    if (tag == kOrientation && bytes.Ok() && value >= 1 && value <= 8) return value;
+// Tags of titles and ratings that the library does not know. Source: Microsoft, "Photo Metadata Policies".
+constexpr TIFFFieldInfo kTitles[] = {
+    {0x4746, 1, 1, TIFF_SHORT, FIELD_CUSTOM, 1, 0, const_cast<char*>("Rating")},
+    {0x4749, 1, 1, TIFF_SHORT, FIELD_CUSTOM, 1, 0, const_cast<char*>("RatingPercent")},
+    {0x9C9B, TIFF_VARIABLE2, TIFF_VARIABLE2, TIFF_BYTE, FIELD_CUSTOM, 1, 1, const_cast<char*>("XPTitle")},
+    {0x9C9C, TIFF_VARIABLE2, TIFF_VARIABLE2, TIFF_BYTE, FIELD_CUSTOM, 1, 1, const_cast<char*>("XPComment")},
+    {0x9C9D, TIFF_VARIABLE2, TIFF_VARIABLE2, TIFF_BYTE, FIELD_CUSTOM, 1, 1, const_cast<char*>("XPAuthor")},
+    {0x9C9E, TIFF_VARIABLE2, TIFF_VARIABLE2, TIFF_BYTE, FIELD_CUSTOM, 1, 1, const_cast<char*>("XPKeywords")},
+    {0x9C9F, TIFF_VARIABLE2, TIFF_VARIABLE2, TIFF_BYTE, FIELD_CUSTOM, 1, 1, const_cast<char*>("XPSubject")},
+};
+
+// What the EXIF block's first directory says of the picture goes into the file's own.
+void SetDescription(TIFF* tiff, const ExifDirectories& directories) {
+  TIFFMergeFieldInfo(tiff, kTitles, static_cast<uint32_t>(std::size(kTitles)));
+  for (const ExifEntry& entry : directories.first) {
+    const bool title = std::any_of(std::begin(kTitles), std::end(kTitles), [&](const TIFFFieldInfo& info) {
+      return info.field_tag == entry.tag && info.field_type == entry.type;
+    });
+    if (entry.type == TIFF_ASCII) {
+      const std::string text(entry.value.begin(), std::find(entry.value.begin(), entry.value.end(), uint8_t{0}));
+      TIFFSetField(tiff, entry.tag, text.c_str());
+    } else if (title && entry.type == TIFF_SHORT && entry.value.size() >= 2) {
+      const uint8_t* value = entry.value.data();
+      TIFFSetField(tiff, entry.tag, directories.bigEndian ? value[0] << 8 | value[1] : value[1] << 8 | value[0]);
+    } else if (title && entry.type == TIFF_BYTE) {
+      TIFFSetField(tiff, entry.tag, entry.count, entry.value.data());
+    }
   }
-  return 1;
+  TIFFSetField(tiff, TIFFTAG_ORIENTATION, int{OrientationOf(directories)});
 }
 
-void SetMetadata(TIFF* tiff, const PictureRecord& picture, bool keep) {
+// The directories of a camera, which have to be in the file before the one that points to them.
+void WriteExif(TiffOutput& output, const ExifDirectories& directories) {
+  const PlacedExif placed = PlaceExif(directories, static_cast<uint32_t>(output.End()));
+  output.Append(placed.bytes);
+  if (placed.exifOffset != 0) TIFFSetField(output.Handle(), TIFFTAG_EXIFIFD, uint64_t{placed.exifOffset});
+  if (placed.gpsOffset != 0) TIFFSetField(output.Handle(), TIFFTAG_GPSIFD, uint64_t{placed.gpsOffset});
+}
+
+void SetMetadata(TiffOutput& output, PictureRecord& picture, bool keep) {
+  TIFF* tiff = output.Handle();
   const PictureMetadata& metadata = picture.metadata;
   TIFFSetField(tiff, TIFFTAG_RESOLUTIONUNIT, RESUNIT_INCH);
   TIFFSetField(tiff, TIFFTAG_XRESOLUTION, metadata.dpiX > 0 ? metadata.dpiX : settings.TiffResolution);
   TIFFSetField(tiff, TIFFTAG_YRESOLUTION, metadata.dpiY > 0 ? metadata.dpiY : settings.TiffResolution);
-  TIFFSetField(tiff, TIFFTAG_SOFTWARE, std::string(kCreator).c_str());
+  if (!keep || picture.metadata.exif.empty()) TIFFSetField(tiff, TIFFTAG_SOFTWARE, std::string(kCreator).c_str());
   if (!keep) return;
-  TIFFSetField(tiff, TIFFTAG_ORIENTATION, int{OrientationOf(metadata.exif)});
+  const ExifDirectories exif = ParseExifBlock(metadata.exif);
+  if (exif.Empty() && !metadata.exif.empty()) picture.lostMetadata |= kLostExif;
+  SetDescription(tiff, exif);
+  WriteExif(output, exif);
   const auto setBlock = [tiff](uint32_t tag, const std::vector<uint8_t>& block) {
     if (!block.empty()) TIFFSetField(tiff, tag, static_cast<uint32_t>(block.size()), block.data());
   };
   setBlock(TIFFTAG_ICCPROFILE, metadata.icc);
   setBlock(TIFFTAG_XMLPACKET, metadata.xmp);
   const std::string comment(picture.comment.begin(), picture.comment.end());
-  if (!comment.empty()) TIFFSetField(tiff, TIFFTAG_IMAGEDESCRIPTION, comment.c_str());
+  const char* described = nullptr;
+  if (!comment.empty() && TIFFGetField(tiff, TIFFTAG_IMAGEDESCRIPTION, &described) == 0) TIFFSetField(tiff, TIFFTAG_IMAGEDESCRIPTION, comment.c_str());
 }
 
 // A row as the file holds it. The library's predictor and byte orders work inside the buffer.
@@ -172,13 +198,13 @@ void MakeRow(const PictureRecord& picture, const TiffPlan& plan, int32_t y, std:
   }
 }
 
-Status WriteAll(ByteWriter& out, const PictureRecord& picture, bool keep) {
+Status WriteAll(ByteWriter& out, PictureRecord& picture, bool keep) {
   TiffOutput output(out);
   if (!output.Open()) return Status::MemoryAllocationError;
   TIFF* tiff = output.Handle();
   const TiffPlan plan = MakePlan(picture);
   SetLayout(tiff, picture, plan);
-  SetMetadata(tiff, picture, keep);
+  SetMetadata(output, picture, keep);
   std::vector<uint8_t> row((static_cast<size_t>(picture.image.Width()) * plan.bits * plan.samples + 7) / 8);
   for (int32_t y = 0; y < picture.image.Height(); ++y) {
     MakeRow(picture, plan, y, row);

@@ -26,6 +26,9 @@ inline constexpr uint8_t kFlattenOnBackground = 2;  // flatten onto the record's
 // UnsupportedFormat (8) without opening the file.
 inline constexpr uint32_t kInfoSignedOnly = 0x200;
 
+// Bits of PictureRecord::lostMetadata.
+inline constexpr uint8_t kLostExif = 1, kLostXmp = 2, kLostIcc = 4;
+
 // Technical facts of a file for "Get info": lines of at most 36 characters.
 class DetailLines {
  public:
@@ -80,6 +83,7 @@ struct PictureRecord {
   uint8_t alphaFlags = 0;     // kHasAlpha, kFlattenOnBackground
 
   PictureMetadata metadata;
+  uint8_t lostMetadata = 0;           // kLost bits: what the last `write` could not keep
   std::vector<uint8_t> comment;       // the file's comment text, UTF-8
   FixedText<80> warning;      // a fault in the file that the decoder passed over; empty when there was none
   int32_t pageCount = 1;      // pages or frames in the file

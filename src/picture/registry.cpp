@@ -9,6 +9,7 @@
 #include "formats/bmp.h"
 #include "formats/fits.h"
 #include "formats/gif.h"
+#include "formats/hdp.h"
 #include "formats/ico.h"
 #include "formats/jpeg.h"
 #include "formats/mac.h"
@@ -80,7 +81,7 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"GIF", "(GIF) CompuServe", 1, 8, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_PAGES | FMT_TIMED | FMT_FRAMES | FMT_LAYERED | FMT_TRANSPARENT,
      GifDetails, GifInfo, GifRead, GifWrite},
     {"HDP", "(HDP) HD Photo", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_FRAMES | FMT_LAYERED,
-     NoDetails, NoInfo, NoRead, NoWrite},
+     HdpDetails, HdpInfo, HdpRead, HdpWrite},
     {"HRZ", "(HRZ) SSTV", 1, 24, FMT_BITMAP,
      nullptr, NoInfo, NoRead, NoWrite},
     {"ICO", "(ICO) Windows icon", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_CONTAINER | FMT_LAYERED | FMT_TRANSPARENT | FMT_ALPHA,
@@ -204,7 +205,7 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"UUE", "(UUE) UUEncoded graphics", 1, 24, FMT_BITMAP | FMT_SECONDARY,
      nullptr, NoInfo, NoRead, NoWrite},
     {"WDP", "(WDP) HD Photo", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_FRAMES | FMT_LAYERED | FMT_SECONDARY,
-     nullptr, NoInfo, NoRead, NoWrite},
+     nullptr, HdpInfo, HdpRead, HdpWrite},
     {"WMF", "(WMF) Windows Metafile", 1, 24, FMT_RENDERED | FMT_SECONDARY,
      nullptr, NoInfo, NoRead, NoWrite},
     {"WMV", "(WMV) WMV video", 1, 24, FMT_BITMAP | FMT_ANIMATED | FMT_TIMED | FMT_SECONDARY | FMT_MEDIA,
@@ -242,6 +243,9 @@ constexpr std::array<FormatEntry, formatCount> MakeRows() {
 constinit std::array<FormatEntry, formatCount> formatRows = MakeRows();
 constinit thread_local FormatEntry spareRow = MakeRows()[kSpareRow];
 const PluginSource* pluginSource = nullptr;
+
+// Rows whose library is loaded when it is needed, and may not be there.
+bool LacksLibrary(const FormatEntry& row) { return row.read == HdpRead && !HdpWorksHere(); }
 
 // A row matches an extension that equals its own, or that shares its first three characters; a shorter one must match
 // to its end.
@@ -282,12 +286,13 @@ std::string PluginDescription(const PluginFormatFacts& format) {
 }
 
 bool CanRead(const FormatEntry& row) {
+  if (LacksLibrary(row)) return false;
   if (row.info == nullptr || row.info == NoInfo || row.info == FifInfo) return false;
   return (row.flags & FMT_RENDERED) != 0 || (row.read != nullptr && row.read != NoRead);
 }
 
 bool CanWrite(const FormatEntry& row) {
-  return row.write != nullptr && row.write != NoWrite && row.write != NeverWritten && row.write != FifWrite;
+  return !LacksLibrary(row) && row.write != nullptr && row.write != NoWrite && row.write != NeverWritten && row.write != FifWrite;
 }
 
 bool CanTellDetails(const FormatEntry& row) { return row.details != nullptr && row.details != NoDetails; }
@@ -297,6 +302,7 @@ bool CanStartUp(const FormatEntry& row) { return row.startup != nullptr && row.s
 std::string_view WhyNot(const FormatEntry& row) {
   if (row.info == FifInfo) return "The format was never published.";
   if ((row.flags & FMT_SPARE) != 0) return "No plug-in uses this row.";
+  if (LacksLibrary(row)) return "The library libjxr is not installed.";
   if (!CanRead(row)) return "This build has no codec for the format.";
   if (row.write == NeverWritten) return "Files of this format can only be read.";
   if (!CanWrite(row)) return "This build cannot write the format.";
@@ -304,7 +310,7 @@ std::string_view WhyNot(const FormatEntry& row) {
 }
 
 bool KeepsMetadata(const FormatEntry& row) {
-  constexpr WriteOperation kWriters[] = {JpegWrite, PngWrite};
+  constexpr WriteOperation kWriters[] = {HdpWrite, JpegWrite, PngWrite, TiffWrite, WebpWrite};
   return std::find(std::begin(kWriters), std::end(kWriters), row.write) != std::end(kWriters);
 }
 

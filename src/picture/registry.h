@@ -106,7 +106,8 @@ bool CanStartUp(const FormatEntry& row);
 // Why a row cannot be read or cannot be written here, in one sentence; empty when both work.
 std::string_view WhyNot(const FormatEntry& row);
 
-// Whether files of the row can hold a picture's EXIF, XMP and color profile.
+// Whether files of the row can hold a picture's EXIF, XMP and color profile. What of them did not fit into one of these
+// files, its writer tells in the record's `lostMetadata`.
 bool KeepsMetadata(const FormatEntry& row);
 // Whether the row's writer protects files by the password of its options.
 bool TakesPassword(const FormatEntry& row);

@@ -35,6 +35,7 @@ constexpr Keeping kKeepings[] = {
     {"JPG", Keeps::Size}, {"JPEG", Keeps::Size},    // lossy
     {"JPE", Keeps::Size}, {"JFI", Keeps::Size},
     {"JFIF", Keeps::Size},  {"WEBP", Keeps::Size},
+    {"HDP", Keeps::Size},   {"WDP", Keeps::Size},
 };
 // clang-format on
 

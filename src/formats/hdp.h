@@ -1,0 +1,20 @@
+#pragma once
+
+#include "picture/picture_record.h"
+#include "picture/write_options.h"
+
+namespace fotomill {
+
+// HD Photo. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3), MemoryAllocationError (6),
+// UnsupportedFormat (8) for colours that are no picture's, NoImages (20) for a page that is not there. Reading and
+// writing also FeatureDisabled (22) where the library is missing.
+Status HdpInfo(PictureRecord& picture, const char* fileName, uint32_t flags);
+Status HdpRead(PictureRecord& picture, const char* fileName);
+Status HdpDetails(PictureRecord& picture);
+// Also ErrorCreatingFile (10), ErrorWritingFile (11).
+Status HdpWrite(PictureRecord& picture, const WriteOptions& options);
+
+// Whether pixels can be read and written on this machine.
+bool HdpWorksHere();
+
+}  // namespace fotomill

@@ -1,0 +1,80 @@
+#include "formats/hdp.h"
+
+#include <gtest/gtest.h>
+
+#include "core/settings.h"
+#include "support/codecs.h"
+#include "support/files.h"
+#include "support/peers.h"
+#include "support/scoped_settings.h"
+
+namespace fotomill::test {
+namespace {
+
+TEST(Hdp, QuantizerZeroKeepsEveryPixelAndOthersStayClose) {
+  if (!HdpWorksHere()) GTEST_SKIP() << "libjxr is not installed";
+  const ScopedSettings scoped;
+  struct Row {
+    int32_t compression, options;
+    bool exact;
+  };
+  for (const Row& row : {Row{0, 0, true}, Row{0, 1, true}, Row{60, 0, false}}) {
+    for (const int32_t bits : {8, 24}) {
+      SCOPED_TRACE(std::to_string(row.compression) + ", " + std::to_string(row.options) + ", " + std::to_string(bits) +
+                   " bits");
+      settings.HDPCompression = row.compression;
+      settings.HDPWriteOptions = row.options;
+      const PicturePointer picture = PatternPicture(45, 37, bits);
+      if (bits == 8) {  // a grey palette keeps the depth
+        for (size_t i = 0; i < 768; ++i) picture->palette[i] = static_cast<uint8_t>(i / 3);
+        const PicturePointer same = PatternPicture(45, 37, bits);
+        ASSERT_EQ(NewPackedImage(45, 37, &picture->palette, 8, picture->image), Status::Ok);
+        for (int32_t y = 0; y < 37; ++y) std::copy_n(same->image.Row(y).data(), 45, picture->image.Row(y).data());
+      }
+      const std::vector<uint8_t> file = Encode(HdpWrite, *picture);
+      const Decoded back = Decode(HdpRead, file);
+      ASSERT_EQ(back.status, Status::Ok);
+      EXPECT_EQ(SamePixels(picture->image, back.picture->image), row.exact);
+      if (!HasProgram("JxrDecApp")) continue;
+      const TemporaryFolder folder;
+      WriteBytes(folder.Path("a.wdp"), file);
+      ASSERT_TRUE(RunShell("JxrDecApp -i " + folder.Path("a.wdp") + " -o " + folder.Path("a.bmp") + " > " +
+                           folder.Path("log")));
+      PicturePointer peer;
+      ASSERT_EQ(LoadPicture(folder.Path("a.bmp").c_str(), peer), Status::Ok);
+      EXPECT_TRUE(SamePixels(peer->image, back.picture->image));
+    }
+  }
+}
+
+// The library trusts its input and often does not survive it; the program must.
+TEST(Hdp, DamagedDataNeverEndTheProgram) {
+  if (!HdpWorksHere()) GTEST_SKIP() << "libjxr is not installed";
+  const std::vector<uint8_t> good = ReadBytes(SourcePath("tests/formats/hdp/good/lossless-by-frequency.wdp"));
+  uint32_t state = 1;
+  const auto next = [&state](size_t below) { return (state = state * 1664525 + 1013904223) / 65536 % below; };
+  int failures = 0;
+  for (int turn = 0; turn < 200; ++turn) {
+    std::vector<uint8_t> file = good;
+    for (int i = 0; i < 2; ++i) file[300 + next(file.size() - 300)] = static_cast<uint8_t>(next(256));
+    const Decoded decoded = Decode(HdpRead, file);
+    EXPECT_EQ(decoded.picture->image.Empty(), decoded.status != Status::Ok) << turn;
+    failures += decoded.status != Status::Ok;
+  }
+  EXPECT_GT(failures, 0);
+}
+
+TEST(Hdp, DirectoriesThatLeadBackToThemselvesEnd) {
+  std::vector<uint8_t> file = ReadBytes(SourcePath("tests/formats/hdp/good/tiles-by-place.hdp"));
+  const auto link = [&file] {  // behind the first directory
+    const size_t at = static_cast<size_t>(file[4] | file[5] << 8);
+    return at + 2 + 12 * static_cast<size_t>(file[at]);
+  }();
+  std::copy_n(file.begin() + 4, 4, file.begin() + static_cast<ptrdiff_t>(link));  // it leads back to itself
+  const Decoded info = Describe(HdpInfo, file);
+  EXPECT_EQ(info.status, Status::Ok);
+  EXPECT_EQ(info.picture->pageCount, 1);
+}
+
+}  // namespace
+}  // namespace fotomill::test
