@@ -1,9 +1,12 @@
 #include "catalog/thumbnail_database.h"
 
 #include <algorithm>
-#include <cstring>
+#include <array>
+#include <map>
+#include <utility>
 
 #include "core/byte_reader.h"
+#include "core/data_folder.h"
 #include "core/settings.h"
 #include "platform/clock.h"
 #include "platform/files.h"
@@ -21,6 +24,9 @@ static_assert(kPathOffset == sizeof(ThumbnailRecord) && kVolumeOffset == kPathOf
               kFlagsOffset == kVolumeOffset + kTextSize && kFlagsOffset + 8 == kDatabaseRecordSize);
 constexpr uint8_t kDeletedFlag = 1;
 constexpr size_t kKeySize = kDatabaseRecordSize - kPathOffset;
+constexpr int64_t kLargeIndex = 1000;  // records; the index of fewer is made faster than it is worth a file
+
+std::string IndexPath(const std::string& databasePath) { return databasePath + ".index"; }
 
 uint64_t OffsetOf(int64_t index) { return kDatabaseHeaderSize + static_cast<uint64_t>(index) * kDatabaseRecordSize; }
 
@@ -49,16 +55,42 @@ bool BytesOf(const DatabaseRecord& record, std::span<uint8_t> bytes) {
 }
 
 // A text that ends at its first zero byte, or with its field.
-std::string TextIn(std::span<const uint8_t> field) {
-  return {field.begin(), std::find(field.begin(), field.begin() + kTextSize - 1, uint8_t{0})};
+std::string_view TextViewIn(std::span<const uint8_t> field) {
+  const std::string_view text(reinterpret_cast<const char*>(field.data()), kTextSize - 1);
+  return text.substr(0, text.find('\0'));
+}
+
+// What an index knows a record by.
+uint32_t IndexedHash(const DatabaseRecord& record) {
+  const bool findable = !record.deleted && record.thumbnail.HasMagic(kSmallThumbnailMagic);
+  return findable ? ThumbnailIndex::HashOf(record.path) : 0;
+}
+
+// What two paths of the same picture have in common.
+std::string_view ComparisonKey(std::string_view path) {
+  if ((browserOptions & kCompareExtensions) != 0) return path;
+  return path.substr(0, path.size() - platform::SplitPath(path).extension.size());
 }
 
 // From the bytes behind the thumbnail.
 template <typename Target>
 void TakeKey(std::span<const uint8_t> bytes, Target& target) {
-  target.path = TextIn(bytes);
-  target.volume = TextIn(bytes.subspan(kVolumeOffset - kPathOffset));
+  target.path = TextViewIn(bytes);
+  target.volume = TextViewIn(bytes.subspan(kVolumeOffset - kPathOffset));
   target.deleted = (bytes[kFlagsOffset - kPathOffset] & kDeletedFlag) != 0;
+}
+
+bool ReadHeaderOf(const platform::StoreFile& file, DatabaseHeader& header) {
+  std::array<uint8_t, kDatabaseHeaderSize> bytes;
+  if (!file.ReadAt(0, bytes)) return false;
+  ByteReader reader(bytes);
+  if (!reader.Match(kDatabaseMagic)) return false;
+  header.version = reader.Le32();
+  header.count = static_cast<int32_t>(reader.Le32());
+  reader.Skip(4);
+  header.created = reader.Le32();
+  header.appended = reader.Le32();
+  return true;
 }
 
 // Gives a database's lock back at the end of a scope.
@@ -119,10 +151,14 @@ bool PurgesMissing(const DatabaseKey& key) {
          kind != platform::DriveKind::Removable && VolumeKeyFor(nearest) == key.volume;
 }
 
-ThumbnailDatabase::Opened ThumbnailDatabase::Open(const std::string& path, bool create) {
+std::string ThumbnailDatabasePath(const std::string& folder) {
+  return folder.empty() ? DataFile(kDatabaseName) : platform::JoinFolder(folder, kDatabaseName);
+}
+
+ThumbnailDatabase::Opened ThumbnailDatabase::OpenThumbnailDatabase(const std::string& path, bool create) {
   using platform::StoreFile;
+  CloseThumbnailDatabase();
   path_ = path;
-  indexedCount_ = -1;
   StoreFile::OpenResult result = file_.Open(path, StoreFile::Mode::ReadWrite);
   if (result == StoreFile::OpenResult::Missing) {
     bool taken = false;
@@ -131,25 +167,26 @@ ThumbnailDatabase::Opened ThumbnailDatabase::Open(const std::string& path, bool 
     result = file_.Open(path, StoreFile::Mode::ReadWrite);
   }
   DatabaseHeader header;
-  if (result == StoreFile::OpenResult::Done && ReadHeader(header)) return Opened::Done;
+  if (result == StoreFile::OpenResult::Done && ReadDatabaseHeader(header)) return Opened::Done;
   file_.Close();
   return Opened::NotRead;
 }
 
-bool ThumbnailDatabase::ReadHeader(DatabaseHeader& header) const {
-  std::array<uint8_t, kDatabaseHeaderSize> bytes;
-  if (!file_.ReadAt(0, bytes)) return false;
-  ByteReader reader(bytes);
-  if (!reader.Match(kDatabaseMagic)) return false;
-  header.version = reader.Le32();
-  header.count = static_cast<int32_t>(reader.Le32());
-  reader.Skip(4);
-  header.created = reader.Le32();
-  header.appended = reader.Le32();
-  return true;
+void ThumbnailDatabase::CloseThumbnailDatabase() {
+  // Only of a file that is still as the index knows it.
+  const bool worthSaving = file_.IsOpen() && indexed_.count >= kLargeIndex && indexed_ != saved_;
+  if (worthSaving && indexed_.size == file_.Size() && indexed_.modified == file_.Modified() && file_.IsStill(path_)) {
+    index_.Save(IndexPath(path_), indexed_);
+    if (settings.WriteHiddenThumbnails != 0) (void)platform::SetHidden(IndexPath(path_), true);
+  }
+  file_.Close();
+  index_.Clear();
+  indexed_ = saved_ = {};
 }
 
-bool ThumbnailDatabase::WriteHeader(const DatabaseHeader& header) {
+bool ThumbnailDatabase::ReadDatabaseHeader(DatabaseHeader& header) const { return ReadHeaderOf(file_, header); }
+
+bool ThumbnailDatabase::WriteDatabaseHeader(const DatabaseHeader& header) {
   return file_.WriteAt(0, BytesOf(header)) && file_.Sync();
 }
 
@@ -159,7 +196,7 @@ int64_t ThumbnailDatabase::RecordCount(const DatabaseHeader& header) const {
   return std::clamp<int64_t>(header.count, 0, most);
 }
 
-bool ThumbnailDatabase::ReadRecord(int64_t index, DatabaseRecord& record) const {
+bool ThumbnailDatabase::ReadDatabaseRecord(int64_t index, DatabaseRecord& record) const {
   std::vector<uint8_t> bytes(kDatabaseRecordSize);
   if (index < 0 || !file_.ReadAt(OffsetOf(index), bytes)) return false;
   std::copy_n(bytes.begin(), record.thumbnail.bytes.size(), record.thumbnail.bytes.begin());
@@ -178,41 +215,53 @@ ThumbnailDatabase::KeyRead ThumbnailDatabase::TryKey(int64_t index, DatabaseKey&
   return ByteReader(magic).Match(kSmallThumbnailMagic) ? KeyRead::Done : KeyRead::NoThumbnail;
 }
 
-std::string ThumbnailDatabase::IndexKey(std::string_view path, std::string_view volume) {
-  return std::string(path).append(1, '\0').append(volume);
-}
-
 // Takes the lock; where another process has put a new file in the old one's place meanwhile, that of the new one.
 bool ThumbnailDatabase::LockAndCheck(DatabaseHeader& header) {
   while (file_.Lock()) {
     if (file_.IsStill(path_)) {
-      if (ReadHeader(header)) return true;
+      if (ReadDatabaseHeader(header)) return true;
       file_.Unlock();
       return false;
     }
     file_.Unlock();
-    if (Open(path_, false) != Opened::Done) return false;
+    if (OpenThumbnailDatabase(path_, false) != Opened::Done) return false;
   }
   return false;
 }
 
+ThumbnailIndex::State ThumbnailDatabase::StateOf(const DatabaseHeader& header) const {
+  return {RecordCount(header), file_.Size(), file_.Modified()};
+}
+
+// Has the index know the file as it is. False when a record could not be read; the index then lacks it, and is made again
+// the next time.
 bool ThumbnailDatabase::UpdateIndex(const DatabaseHeader& header) {
-  const int64_t count = RecordCount(header);
-  if (indexedCount_ == count && indexedSize_ == file_.Size() && indexedTime_ == file_.Modified()) return true;
-  index_.clear();
-  indexedCount_ = -1;
-  bool complete = true;
-  DatabaseKey key;
-  for (int64_t i = 0; i < count; ++i) {
-    const KeyRead read = TryKey(i, key);
-    complete = complete && read != KeyRead::Failed;
-    if (read == KeyRead::Done && !key.deleted) index_[IndexKey(key.path, key.volume)].push_back(i);
-  }
-  if (!complete) return false;
-  indexedCount_ = count;
-  indexedSize_ = file_.Size();
-  indexedTime_ = file_.Modified();
+  const ThumbnailIndex::State state = StateOf(header);
+  if (indexed_ == state) return true;
+  indexed_ = {};
+  const bool large = state.count >= kLargeIndex;
+  const bool loaded = large && index_.Load(IndexPath(path_), state);
+  if (!loaded && !BuildIndex(state.count)) return false;
+  indexed_ = state;
+  if (loaded) saved_ = state;
   return true;
+}
+
+// Reads the names alone: those of a record and the magic of the next lie side by side.
+bool ThumbnailDatabase::BuildIndex(int64_t count) {
+  index_.Clear();
+  std::array<uint8_t, kKeySize + kSmallThumbnailMagic.size()> bytes;
+  const std::span<uint8_t> nextMagic = std::span(bytes).subspan(kKeySize);
+  bool complete = count == 0 || file_.ReadAt(OffsetOf(0), nextMagic);
+  for (int64_t i = 0; i < count; ++i) {
+    const bool thumbnail = ByteReader(nextMagic).Match(kSmallThumbnailMagic);
+    const std::span<uint8_t> wanted = std::span(bytes).first(i + 1 < count ? bytes.size() : kKeySize);
+    const bool read = file_.ReadAt(OffsetOf(i) + kPathOffset, wanted);
+    complete = complete && read;
+    const bool deleted = (bytes[kFlagsOffset - kPathOffset] & kDeletedFlag) != 0;
+    index_.Append(read && thumbnail && !deleted ? ThumbnailIndex::HashOf(TextViewIn(bytes)) : 0);
+  }
+  return complete;
 }
 
 bool ThumbnailDatabase::MarkDeleted(int64_t index) {
@@ -222,72 +271,116 @@ bool ThumbnailDatabase::MarkDeleted(int64_t index) {
   return file_.WriteAt(OffsetOf(index) + kFlagsOffset, {&flags, 1});
 }
 
-bool ThumbnailDatabase::Append(std::span<const DatabaseRecord> records, bool replace) {
+// The records of the same paths and volumes as new ones, which are to stand from `first` on: those that are there, and new
+// ones that come again further on. False when one cannot be read.
+bool ThumbnailDatabase::FindRecordsToReplace(std::span<const DatabaseRecord> records, int64_t first,
+                                             std::vector<int64_t>& replaced) const {
+  std::map<std::pair<std::string_view, std::string_view>, int64_t> added;
+  DatabaseKey key;
+  for (size_t i = 0; i < records.size(); ++i) {
+    const auto number = first + static_cast<int64_t>(i);
+    const auto [same, fresh] = added.try_emplace({records[i].path, records[i].volume}, number);
+    if (!fresh) {
+      replaced.push_back(std::exchange(same->second, number));
+      continue;
+    }
+    const bool failed = index_.Find(ThumbnailIndex::HashOf(records[i].path), [&](size_t index) {
+      const KeyRead read = TryKey(static_cast<int64_t>(index), key);
+      const bool wanted = read == KeyRead::Done && !key.deleted && key.path == records[i].path && key.volume == records[i].volume;
+      if (wanted) replaced.push_back(static_cast<int64_t>(index));
+      return read == KeyRead::Failed;
+    });
+    if (failed) return false;
+  }
+  return true;
+}
+
+bool ThumbnailDatabase::WriteRecords(std::span<const DatabaseRecord> records, int64_t first) {
+  std::vector<uint8_t> bytes(kDatabaseRecordSize);
+  for (const DatabaseRecord& record : records) {
+    if (!BytesOf(record, bytes) || !file_.WriteAt(OffsetOf(first++), bytes)) return false;
+  }
+  return file_.Sync();
+}
+
+bool ThumbnailDatabase::AppendDatabaseRecords(std::span<const DatabaseRecord> records, bool replace) {
   DatabaseHeader header;
   if (!LockAndCheck(header)) return false;
   const Unlocker unlocker(file_);
-  if (header.count != RecordCount(header) || INT32_MAX - header.count < static_cast<int64_t>(records.size())) return false;
+  const int64_t first = header.count;
+  if (first != RecordCount(header) || INT32_MAX - first < static_cast<int64_t>(records.size())) return false;
   if (replace && !UpdateIndex(header)) return false;
-  indexedCount_ = -1;  // until all is done
-  std::vector<uint8_t> bytes(kDatabaseRecordSize);
+  const bool indexed = indexed_ == StateOf(header);
+  indexed_ = {};  // until all is done
   std::vector<int64_t> replaced;
-  for (size_t i = 0; i < records.size(); ++i) {
-    if (!BytesOf(records[i], bytes)) return false;
-    const int64_t index = header.count + static_cast<int64_t>(i);
-    if (!file_.WriteAt(OffsetOf(index), bytes)) return false;
-    if (!replace) continue;
-    std::vector<int64_t>& same = index_[IndexKey(records[i].path, records[i].volume)];
-    replaced.insert(replaced.end(), same.begin(), same.end());
-    same.assign(1, index);
-  }
+  if (replace && !FindRecordsToReplace(records, first, replaced)) return false;
+  if (!WriteRecords(records, first)) return false;
   header.count += static_cast<int32_t>(records.size());
   header.appended = static_cast<uint32_t>(platform::Now());
-  if (!file_.Sync() || !WriteHeader(header)) return false;
+  if (!WriteDatabaseHeader(header)) return false;
   // Only now, as a record that is counted must never be lost.
   for (const int64_t index : replaced) {
     if (!MarkDeleted(index)) return false;
   }
   if (!replaced.empty() && !file_.Sync()) return false;
-  if (replace) {
-    indexedCount_ = header.count;
-    indexedSize_ = file_.Size();
-    indexedTime_ = file_.Modified();
-  }
+  if (!indexed) return true;
+  for (const DatabaseRecord& record : records) index_.Append(IndexedHash(record));
+  for (const int64_t index : replaced) index_.Change(static_cast<size_t>(index), 0);
+  indexed_ = StateOf(header);
+  return true;
+}
+
+bool ThumbnailDatabase::WriteDatabaseRecord(int64_t index, const DatabaseRecord& record) {
+  DatabaseHeader header;
+  if (!LockAndCheck(header)) return false;
+  const Unlocker unlocker(file_);
+  if (index < 0 || index >= RecordCount(header)) return false;
+  const bool indexed = indexed_ == StateOf(header);
+  indexed_ = {};
+  if (!WriteRecords({&record, 1}, index)) return false;
+  if (!indexed) return true;
+  index_.Change(static_cast<size_t>(index), IndexedHash(record));
+  indexed_ = StateOf(header);
   return true;
 }
 
 bool ThumbnailDatabase::Find(const std::string& path, const std::string& volume, ThumbnailRecord& thumbnail) {
   DatabaseHeader header;
-  if (!file_.IsStill(path_) && Open(path_, false) != Opened::Done) return false;  // it was compacted meanwhile
-  if (!ReadHeader(header)) return false;
+  if (!file_.IsStill(path_) && OpenThumbnailDatabase(path_, false) != Opened::Done) return false;  // it was compacted meanwhile
+  if (!ReadDatabaseHeader(header)) return false;
   (void)UpdateIndex(header);  // what cannot be read is passed over
-  const auto found = index_.find(IndexKey(path, volume));
-  if (found == index_.end()) return false;
-  for (const int64_t index : found->second) {
-    DatabaseRecord record;
-    if (!ReadRecord(index, record) || record.deleted) continue;
-    thumbnail = record.thumbnail;
+  std::vector<uint8_t> bytes(kDatabaseRecordSize);
+  return index_.Find(ThumbnailIndex::HashOf(path), [&](size_t index) {
+    DatabaseKey key;
+    if (!file_.ReadAt(OffsetOf(static_cast<int64_t>(index)), bytes) || !ByteReader(bytes).Match(kSmallThumbnailMagic)) return false;
+    TakeKey(std::span<const uint8_t>(bytes).subspan(kPathOffset), key);
+    if (key.deleted || key.volume != volume || ComparisonKey(key.path) != ComparisonKey(path)) return false;
+    std::copy_n(bytes.begin(), thumbnail.bytes.size(), thumbnail.bytes.begin());
     return true;
-  }
-  return false;
+  });
 }
 
 int64_t ThumbnailDatabase::Delete(const std::string& path) {
   DatabaseHeader header;
   if (!LockAndCheck(header)) return -1;
   const Unlocker unlocker(file_);
-  indexedCount_ = -1;
-  const int64_t count = RecordCount(header);
-  int64_t deleted = 0;
+  if (!UpdateIndex(header)) return -1;
+  indexed_ = {};
+  std::vector<size_t> deleted;
   DatabaseKey key;
-  for (int64_t i = 0; i < count; ++i) {
-    const KeyRead read = TryKey(i, key);
-    if (read == KeyRead::Failed) return -1;
-    if (read != KeyRead::Done || key.deleted || key.path != path) continue;
-    if (!MarkDeleted(i)) return -1;
-    ++deleted;
+  const bool failed = index_.Find(ThumbnailIndex::HashOf(path), [&](size_t index) {
+    const KeyRead read = TryKey(static_cast<int64_t>(index), key);
+    if (read == KeyRead::Done && !key.deleted && key.path == path) deleted.push_back(index);
+    return read == KeyRead::Failed;
+  });
+  if (failed) return -1;
+  for (const size_t index : deleted) {
+    if (!MarkDeleted(static_cast<int64_t>(index))) return -1;
+    index_.Change(index, 0);
   }
-  return deleted > 0 && !file_.Sync() ? -1 : deleted;
+  if (!deleted.empty() && !file_.Sync()) return -1;
+  indexed_ = StateOf(header);
+  return static_cast<int64_t>(deleted.size());
 }
 
 ThumbnailDatabase::Compacted ThumbnailDatabase::CopyLiveRecords(platform::StoreFile& to, DatabaseHeader header, bool purge,
@@ -313,9 +406,10 @@ ThumbnailDatabase::Compacted ThumbnailDatabase::CopyLiveRecords(platform::StoreF
   return to.WriteAt(0, BytesOf(header)) && to.Sync() ? Compacted::Done : Compacted::Failed;
 }
 
-ThumbnailDatabase::Compacted ThumbnailDatabase::Compact(bool purge, ProgressSink* progress, const std::atomic<bool>* stop) {
+ThumbnailDatabase::Compacted ThumbnailDatabase::CompactThumbnailDatabase(bool purge, ProgressSink* progress,
+                                                                         const std::atomic<bool>* stop) {
   const Compacted result = CompactLocked(purge, progress, stop);
-  if (result == Compacted::Done && Open(path_, false) != Opened::Done) return Compacted::NotRead;
+  if (result == Compacted::Done && OpenThumbnailDatabase(path_, false) != Opened::Done) return Compacted::NotRead;
   return result;
 }
 
@@ -342,6 +436,21 @@ ThumbnailDatabase::Compacted ThumbnailDatabase::CompactLocked(bool purge, Progre
     (void)platform::SetHidden(path_, true);
   }
   return result;
+}
+
+bool FindDatabaseThumbnail(ThumbnailRecord& thumbnail, const std::string& path, const std::string& databasePath) {
+  platform::StoreFile file;
+  DatabaseHeader header;
+  std::vector<uint8_t> bytes(kDatabaseRecordSize);
+  if (file.Open(databasePath, platform::StoreFile::Mode::Read) != platform::StoreFile::OpenResult::Done) return false;
+  if (!ReadHeaderOf(file, header)) return false;
+  for (int64_t i = 0; i < header.count; ++i) {
+    if (!file.ReadAt(OffsetOf(i), bytes) || !ByteReader(bytes).Match(kSmallThumbnailMagic)) return false;
+    if (TextViewIn(std::span(bytes).subspan(kPathOffset)) != path) continue;
+    std::copy_n(bytes.begin(), thumbnail.bytes.size(), thumbnail.bytes.begin());
+    return true;
+  }
+  return false;
 }
 
 }  // namespace fotomill

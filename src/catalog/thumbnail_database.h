@@ -1,14 +1,13 @@
 #pragma once
 
-#include <array>
 #include <atomic>
 #include <cstdint>
 #include <span>
 #include <string>
 #include <string_view>
-#include <unordered_map>
 #include <vector>
 
+#include "catalog/thumbnail_index.h"
 #include "catalog/thumbnail_record.h"
 #include "core/progress.h"
 #include "platform/store_file.h"
@@ -32,7 +31,8 @@ namespace fotomill {
 //            28434    1  flags: bit 0 set, the record is deleted
 //            28435    7  0
 //
-// A record is written and on disk before the header counts it; what stands behind the counted ones means nothing.
+// The global database lies in the data folder, a local one in the folder of its pictures. A record is written and on disk
+// before the header counts it; what stands behind the counted ones means nothing.
 inline constexpr size_t kDatabaseHeaderSize = 60;
 inline constexpr size_t kDatabaseRecordSize = 28442;
 inline constexpr std::string_view kDatabaseMagic = "BRNTTDBX";
@@ -66,9 +66,23 @@ std::string VolumeKeyFor(const std::string& path);
 // than the record's lies now.
 bool PurgesMissing(const DatabaseKey& key);
 
-// One open database. Every change holds the file's lock, so that several processes may append at once.
+// The database of a folder; of an empty one the global database, whose path is empty where there is no data folder.
+std::string ThumbnailDatabasePath(const std::string& folder);
+
+// What all browsers share: with kCompareExtensions, pictures that differ in their extension only are two.
+inline constexpr uint8_t kCompareExtensions = 1;
+inline std::atomic<uint8_t> browserOptions{kCompareExtensions};
+
+// One open database. Every change holds the file's lock, so that several processes may append at once. Lookups and
+// appends do not take longer the more records there are: an index, kept between runs in "PATH.index", says where to look.
+// An object is used by one thread at a time.
 class ThumbnailDatabase {
  public:
+  ThumbnailDatabase() = default;
+  ThumbnailDatabase(const ThumbnailDatabase&) = delete;
+  ThumbnailDatabase& operator=(const ThumbnailDatabase&) = delete;
+  ~ThumbnailDatabase() { CloseThumbnailDatabase(); }
+
   enum class Opened {
     Done,
     Missing,
@@ -77,22 +91,25 @@ class ThumbnailDatabase {
   };
   // Opens the database of that path; with `create`, one that is missing is made with an empty header, and hidden with
   // WriteHiddenThumbnails.
-  Opened Open(const std::string& path, bool create);
-  void Close() { file_.Close(); }
+  Opened OpenThumbnailDatabase(const std::string& path, bool create);
+  void CloseThumbnailDatabase();
 
   // False when the file is shorter than a header or not a database.
-  bool ReadHeader(DatabaseHeader& header) const;
+  bool ReadDatabaseHeader(DatabaseHeader& header) const;
   // How many of the counted records the file holds.
   int64_t RecordCount(const DatabaseHeader& header) const;
   // False beyond the end of the file, or when there is no small thumbnail.
-  bool ReadRecord(int64_t index, DatabaseRecord& record) const;
+  bool ReadDatabaseRecord(int64_t index, DatabaseRecord& record) const;
   // The same without the thumbnail's pixels.
   bool ReadKey(int64_t index, DatabaseKey& key) const;
 
   // Appends records and has them on disk. Earlier ones of the same path and volume, if any are to be `replaced`, are then
   // marked deleted. False when they could not all be written, or the header counts more than the file holds; the file
   // then has no more records than before.
-  bool Append(std::span<const DatabaseRecord> records, bool replace);
+  bool AppendDatabaseRecords(std::span<const DatabaseRecord> records, bool replace);
+  bool AppendDatabaseRecord(const DatabaseRecord& record) { return AppendDatabaseRecords({&record, 1}, false); }
+  // Puts a record in the place of one that is counted, and has it on disk.
+  bool WriteDatabaseRecord(int64_t index, const DatabaseRecord& record);
   // The thumbnail of the first record that is not deleted, of that path and volume.
   bool Find(const std::string& path, const std::string& volume, ThumbnailRecord& thumbnail);
   // Marks every record of a path deleted, whatever its volume; how many there were, -1 when it could not be done.
@@ -104,19 +121,21 @@ class ThumbnailDatabase {
     Failed,   // the new file could not be written
     Stopped,  // asked to stop
   };
-  // Copies what is not deleted (and with `purge`, whose picture is there) into "PATH.BAK", which then takes the database's
-  // place in one step. Otherwise the database stays as it was.
-  Compacted Compact(bool purge, ProgressSink* progress = nullptr, const std::atomic<bool>* stop = nullptr);
+  // Copies what is not deleted (and with `purgeMissing`, whose picture is there) into "PATH.BAK", which then takes the
+  // database's place in one step. Otherwise the database stays as it was.
+  Compacted CompactThumbnailDatabase(bool purgeMissing, ProgressSink* progress = nullptr,
+                                     const std::atomic<bool>* stop = nullptr);
 
  private:
-  using Index = std::unordered_map<std::string, std::vector<int64_t>>;  // live records of a path and volume, in order
-  static std::string IndexKey(std::string_view path, std::string_view volume);
   enum class KeyRead { Done, NoThumbnail, Failed };
   KeyRead TryKey(int64_t index, DatabaseKey& key) const;
   bool LockAndCheck(DatabaseHeader& header);
-  // False when a record could not be read; the index then lacks it, and is made again the next time.
+  ThumbnailIndex::State StateOf(const DatabaseHeader& header) const;
   bool UpdateIndex(const DatabaseHeader& header);
-  bool WriteHeader(const DatabaseHeader& header);
+  bool BuildIndex(int64_t count);
+  bool FindRecordsToReplace(std::span<const DatabaseRecord> records, int64_t first, std::vector<int64_t>& replaced) const;
+  bool WriteRecords(std::span<const DatabaseRecord> records, int64_t first);
+  bool WriteDatabaseHeader(const DatabaseHeader& header);
   bool MarkDeleted(int64_t index);
   Compacted CompactLocked(bool purge, ProgressSink* progress, const std::atomic<bool>* stop);
   Compacted CopyLiveRecords(platform::StoreFile& to, DatabaseHeader header, bool purge, ProgressSink* progress,
@@ -124,11 +143,13 @@ class ThumbnailDatabase {
 
   std::string path_;
   platform::StoreFile file_;
-  Index index_;
-  // The file as the index knows it; another count, size or time means that someone else has changed it.
-  int64_t indexedCount_ = -1;
-  uint64_t indexedSize_ = 0;
-  int64_t indexedTime_ = 0;
+  ThumbnailIndex index_;
+  ThumbnailIndex::State indexed_;  // the file as the index knows it: in another state, someone else has changed it
+  ThumbnailIndex::State saved_;    // as the saved index knows it
 };
+
+// The thumbnail of the first record of exactly that path in a database, deleted or not and on whatever volume. False as
+// well when a record before it cannot be read.
+bool FindDatabaseThumbnail(ThumbnailRecord& thumbnail, const std::string& path, const std::string& databasePath);
 
 }  // namespace fotomill

@@ -34,7 +34,7 @@ constexpr size_t kAddedAtOnce = 64;  // pictures, about 2 MB
 
 // Opens a database. False after a message.
 bool OpenDatabase(ThumbnailDatabase& database, const std::string& path, bool create, ResultOutput& output) {
-  switch (database.Open(path, create)) {
+  switch (database.OpenThumbnailDatabase(path, create)) {
     case ThumbnailDatabase::Opened::Done: return true;
     case ThumbnailDatabase::Opened::Missing: output.Failure(path, Status::FileOpenError); break;
     case ThumbnailDatabase::Opened::NotRead: output.Failure(path, Status::DamagedFile, kNoDatabase); break;
@@ -64,7 +64,7 @@ class Adding {
   }
 
   void Flush() {
-    const bool added = records_.empty() || database_.Append(records_, true);
+    const bool added = records_.empty() || database_.AppendDatabaseRecords(records_, true);
     for (const std::string& name : names_) {
       if (!added) {
         output_.Failure(name, Status::ErrorWritingFile, kNotAdded);
@@ -174,7 +174,7 @@ int RunList(const TdbOptions& options, CommandContext& context) {
   ThumbnailDatabase database;
   DatabaseHeader header;
   if (!OpenDatabase(database, path, false, output)) return output.Finish();
-  if (!database.ReadHeader(header)) {
+  if (!database.ReadDatabaseHeader(header)) {
     output.Failure(path, Status::DamagedFile, kNoDatabase);
     return output.Finish();
   }
@@ -201,7 +201,7 @@ int64_t CountRecords(const ThumbnailDatabase& database, Test test) {
   DatabaseHeader header;
   DatabaseKey key;
   int64_t count = 0;
-  const int64_t records = database.ReadHeader(header) ? database.RecordCount(header) : 0;
+  const int64_t records = database.ReadDatabaseHeader(header) ? database.RecordCount(header) : 0;
   for (int64_t i = 0; i < records; ++i) count += database.ReadKey(i, key) && test(key);
   return count;
 }
@@ -234,7 +234,7 @@ int RunCompact(const TdbOptions& options, CommandContext& context) {
   ThumbnailDatabase database;
   DatabaseHeader before, after;
   if (!OpenDatabase(database, path, false, output)) return output.Finish();
-  const bool read = database.ReadHeader(before);
+  const bool read = database.ReadDatabaseHeader(before);
   if (options.dryRun) {
     const int64_t kept = CountRecords(database, [&](const DatabaseKey& key) {
       return !key.deleted && !(options.purge && !platform::FileExists(key.path) && PurgesMissing(key));
@@ -242,8 +242,8 @@ int RunCompact(const TdbOptions& options, CommandContext& context) {
     output.Line(std::to_string(before.count) + " -> " + std::to_string(kept) + " records");
     return kExitOk;
   }
-  const ThumbnailDatabase::Compacted result = read ? database.Compact(options.purge) : ThumbnailDatabase::Compacted::NotRead;
-  if (result == ThumbnailDatabase::Compacted::Done && database.ReadHeader(after)) {
+  const ThumbnailDatabase::Compacted result = read ? database.CompactThumbnailDatabase(options.purge) : ThumbnailDatabase::Compacted::NotRead;
+  if (result == ThumbnailDatabase::Compacted::Done && database.ReadDatabaseHeader(after)) {
     output.Line(std::to_string(before.count) + " -> " + std::to_string(after.count) + " records");
     return kExitOk;
   }

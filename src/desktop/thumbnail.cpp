@@ -6,7 +6,6 @@
 #include "catalog/thumbnail_database.h"
 #include "catalog/thumbnail_file.h"
 #include "core/choice_lists.h"
-#include "core/data_folder.h"
 #include "core/settings.h"
 #include "picture/registry.h"
 #include "platform/files.h"
@@ -29,12 +28,12 @@ bool FindInDatabase(const ThumbnailWish& wish, ThumbnailRecord& record) {
   static std::string openPath;
   static ThumbnailDatabase database;
   const std::string folder(platform::SplitPath(wish.path).folder);
-  const std::string path = wish.mode == choice::kGlobalDatabase ? DataFile(kDatabaseName) : platform::JoinFolder(folder, kDatabaseName);
+  const std::string path = ThumbnailDatabasePath(wish.mode == choice::kGlobalDatabase ? std::string() : folder);
   const std::lock_guard lock(mutex);
   if (path != openPath) {
     openPath.clear();
-    database.Close();
-    if (database.Open(path, false) != ThumbnailDatabase::Opened::Done) return false;
+    database.CloseThumbnailDatabase();
+    if (database.OpenThumbnailDatabase(path, false) != ThumbnailDatabase::Opened::Done) return false;
     openPath = path;
   }
   return database.Find(wish.path, VolumeKeyFor(wish.path), record);

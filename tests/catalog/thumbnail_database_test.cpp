@@ -40,10 +40,10 @@ class Database : public testing::Test {
     ThumbnailDatabase database;
     DatabaseHeader header;
     std::vector<std::string> records;
-    if (database.Open(Path(), false) != Opened::Done || !database.ReadHeader(header)) return {"unreadable"};
+    if (database.OpenThumbnailDatabase(Path(), false) != Opened::Done || !database.ReadDatabaseHeader(header)) return {"unreadable"};
     for (int64_t i = 0; i < database.RecordCount(header); ++i) {
       DatabaseRecord record;
-      if (!database.ReadRecord(i, record)) return {"broken"};
+      if (!database.ReadDatabaseRecord(i, record)) return {"broken"};
       records.push_back(record.path + " " + record.volume + " " + std::to_string(record.thumbnail.bytes[300]) +
                         (record.deleted ? " x" : ""));
     }
@@ -63,13 +63,13 @@ DatabaseRecord Record(const std::string& path, const std::string& volume, uint8_
 
 bool Append(ThumbnailDatabase& database, const std::string& path, const std::string& volume, uint8_t pixel, bool replace = false) {
   const DatabaseRecord record = Record(path, volume, pixel);
-  return database.Append({&record, 1}, replace);
+  return database.AppendDatabaseRecords({&record, 1}, replace);
 }
 
 TEST_F(Database, IsLaidOutToTheByte) {
   ThumbnailDatabase database;
-  EXPECT_EQ(database.Open(Path(), false), Opened::Missing);
-  ASSERT_EQ(database.Open(Path(), true), Opened::Done);
+  EXPECT_EQ(database.OpenThumbnailDatabase(Path(), false), Opened::Missing);
+  ASSERT_EQ(database.OpenThumbnailDatabase(Path(), true), Opened::Done);
   std::vector<uint8_t> empty = Hex(R"(42 52 4E 54 54 44 42 58  # BRNTTDBX
       00 01 60 01  00 00 00 00  00 00 00 00                    # version, count, reserved
       00 21 43 65  00 21 43 65                                 # created, appended)");
@@ -89,9 +89,9 @@ TEST_F(Database, IsLaidOutToTheByte) {
   EXPECT_EQ(database.Delete("/a"), 1);
   EXPECT_EQ(ReadBytes(Path())[60 + 28434], 1);
   const std::atomic<bool> stop = true;
-  EXPECT_EQ(database.Compact(false, nullptr, &stop), Compacted::Stopped);
+  EXPECT_EQ(database.CompactThumbnailDatabase(false, nullptr, &stop), Compacted::Stopped);
   EXPECT_EQ(Size(), 28502u);
-  EXPECT_EQ(database.Compact(false), Compacted::Done);
+  EXPECT_EQ(database.CompactThumbnailDatabase(false), Compacted::Done);
   EXPECT_EQ(Size(), 60u);
   EXPECT_THAT(folder_.Names(), ElementsAre("Fotomill.tdb"));
 }
@@ -119,8 +119,8 @@ TEST_F(Database, NamesVolumes) {
 // Every lookup gives what a scan from the first record gives, whatever happened before, also through another handle.
 TEST_F(Database, FindsWhatAScanFinds) {
   ThumbnailDatabase one, two;
-  ASSERT_EQ(one.Open(Path(), true), Opened::Done);
-  ASSERT_EQ(two.Open(Path(), false), Opened::Done);
+  ASSERT_EQ(one.OpenThumbnailDatabase(Path(), true), Opened::Done);
+  ASSERT_EQ(two.OpenThumbnailDatabase(Path(), false), Opened::Done);
   struct Row {
     std::string path, volume;
     uint8_t pixel;
@@ -133,7 +133,7 @@ TEST_F(Database, FindsWhatAScanFinds) {
     ThumbnailDatabase& database = random() % 2 ? one : two;
     const std::string path = "/p" + std::to_string(random() % 6), volume = "v" + std::to_string(random() % 2);
     const auto pixel = static_cast<uint8_t>(step);
-    switch (random() % 8) {
+    switch (random() % 9) {
       case 0: {
         int64_t count = 0;
         for (Row& row : model) count += row.path == path && !std::exchange(row.deleted, row.deleted || row.path == path);
@@ -142,7 +142,7 @@ TEST_F(Database, FindsWhatAScanFinds) {
       }
       case 1:
         if (random() % 4 == 0) {
-          ASSERT_EQ(database.Compact(false), Compacted::Done);
+          ASSERT_EQ(database.CompactThumbnailDatabase(false), Compacted::Done);
           std::erase_if(model, [](const Row& row) { return row.deleted; });
         }
         break;
@@ -154,11 +154,18 @@ TEST_F(Database, FindsWhatAScanFinds) {
         model.push_back({path, volume, pixel});
         break;
       }
+      case 4:
+        if (!model.empty() && random() % 4 == 0) {
+          const size_t index = random() % model.size();
+          ASSERT_TRUE(database.WriteDatabaseRecord(static_cast<int64_t>(index), Record(path, volume, pixel)));
+          model[index] = {path, volume, pixel};
+        }
+        break;
       default: break;
     }
     // A handle on a database that was compacted through another one is opened again by its next change.
     ThumbnailDatabase fresh;
-    ASSERT_EQ(fresh.Open(Path(), false), Opened::Done);
+    ASSERT_EQ(fresh.OpenThumbnailDatabase(Path(), false), Opened::Done);
     ThumbnailRecord found;
     const auto wanted = std::ranges::find_if(
         model, [&](const Row& row) { return !row.deleted && row.path == path && row.volume == volume; });
@@ -173,9 +180,105 @@ TEST_F(Database, FindsWhatAScanFinds) {
   }
 }
 
+TEST_F(Database, ComparesExtensionsAsItIsTold) {
+  ThumbnailDatabase database;
+  ASSERT_EQ(database.OpenThumbnailDatabase(Path(), true), Opened::Done);
+  ASSERT_TRUE(Append(database, "/p.x/a.jpg", "v", 1) && Append(database, "/p.x/a.png", "w", 2) && Append(database, "/p.x/a.png", "v", 3));
+  ThumbnailRecord found;
+  EXPECT_FALSE(database.Find("/p.x/a.gif", "v", found));
+  ASSERT_TRUE(database.Find("/p.x/a.png", "v", found));
+  EXPECT_EQ(found.bytes[300], 3);
+  browserOptions = 0;
+  ASSERT_TRUE(database.Find("/p.x/a.gif", "v", found));
+  EXPECT_EQ(found.bytes[300], 1);
+  EXPECT_FALSE(database.Find("/p.y/a.jpg", "v", found));
+  browserOptions = kCompareExtensions;
+  // By exact path whatever the volume, deleted ones too.
+  ASSERT_EQ(database.Delete("/p.x/a.png"), 2);
+  ASSERT_TRUE(FindDatabaseThumbnail(found, "/p.x/a.png", Path()));
+  EXPECT_EQ(found.bytes[300], 2);
+  EXPECT_FALSE(FindDatabaseThumbnail(found, "/p.x/a.gif", Path()));
+  std::vector<uint8_t> bytes = ReadBytes(Path());
+  bytes[60] = 'X';
+  WriteBytes(Path(), bytes);
+  EXPECT_FALSE(FindDatabaseThumbnail(found, "/p.x/a.png", Path())) << "a record before it is none";
+}
+
+// Lookups are right whatever has become of the saved index.
+TEST_F(Database, ASavedIndexIsOnlyAHelp) {
+  constexpr int kMany = 1200;
+  const std::string index = Path() + ".index";
+  std::vector<DatabaseRecord> records;
+  for (int i = 0; i < kMany; ++i) records.push_back(Record("/p/" + std::to_string(i), "v", static_cast<uint8_t>(i)));
+  const auto open = [&](ThumbnailDatabase& database) { return database.OpenThumbnailDatabase(Path(), true) == Opened::Done; };
+  const auto finds = [&](int number) {
+    ThumbnailDatabase database;
+    ThumbnailRecord found;
+    return open(database) && database.Find("/p/" + std::to_string(number), "v", found) && found.bytes[300] == number % 256;
+  };
+  {
+    ThumbnailDatabase database;
+    ASSERT_TRUE(open(database) && database.AppendDatabaseRecords(records, true));
+  }
+  ASSERT_TRUE(std::filesystem::exists(index));
+  const std::vector<uint8_t> good = ReadBytes(index);
+  EXPECT_EQ(good.size(), 40u + 4 * kMany);
+  EXPECT_TRUE(finds(0) && finds(kMany - 1) && !finds(kMany));
+  EXPECT_EQ(ReadBytes(index), good);
+  std::vector<uint8_t> bad = good;
+  bad[40 + 4 * 7] ^= 1;  // the hash of number 7
+  WriteBytes(index, bad);
+  EXPECT_TRUE(finds(7));
+  EXPECT_EQ(ReadBytes(index), good) << "made anew";
+  WriteBytes(index, {good.begin(), good.begin() + 100});
+  EXPECT_TRUE(finds(7));
+  {
+    ThumbnailDatabase database;
+    ASSERT_TRUE(open(database));
+    ASSERT_TRUE(Append(database, "/p/7", "v", 99, true));
+    EXPECT_EQ(database.Delete("/p/8"), 1);
+  }
+  EXPECT_TRUE(!finds(7) && !finds(8) && finds(9));
+  WriteBytes(index, good);  // of a state that is gone
+  EXPECT_TRUE(!finds(7) && !finds(8) && finds(9));
+  WriteText(index, "precious");
+  EXPECT_TRUE(finds(9));
+  EXPECT_EQ(ReadText(index), "precious");
+}
+
+TEST(ThumbnailIndex, KnowsEveryRecordInOrderThroughChanges) {
+  ThumbnailIndex index;
+  std::vector<uint32_t> model;
+  std::mt19937 random(3);
+  // Few hashes, and some that share a home, so that searches run into one another.
+  const auto hash = [&] { return random() % 3 == 0 ? 0 : static_cast<uint32_t>(random() % 40 + 1) << (random() % 2 * 27); };
+  for (int step = 0; step < 4000; ++step) {
+    if (random() % 3 != 0 || model.empty()) {
+      model.push_back(hash());
+      index.Append(model.back());
+    } else {
+      const size_t record = random() % model.size();
+      model[record] = random() % 8 == 0 ? hash() : 0;
+      index.Change(record, model[record]);
+    }
+    if (step % 50 != 0) continue;
+    for (const uint32_t wanted : model) {
+      std::vector<size_t> found, expected;
+      for (size_t i = 0; i < model.size(); ++i) {
+        if (wanted != 0 && model[i] == wanted) expected.push_back(i);
+      }
+      index.Find(std::max(wanted, 1u), [&](size_t record) {
+        found.push_back(record);
+        return false;
+      });
+      ASSERT_TRUE(wanted == 0 || found == expected) << step;
+    }
+  }
+}
+
 TEST_F(Database, LeavesAloneWhatItCannotRead) {
   ThumbnailDatabase database;
-  ASSERT_EQ(database.Open(Path(), true), Opened::Done);
+  ASSERT_EQ(database.OpenThumbnailDatabase(Path(), true), Opened::Done);
   ASSERT_TRUE(Append(database, "/a", "v", 1));
   ASSERT_TRUE(Append(database, "/b", "v", 2));
   const std::vector<uint8_t> good = ReadBytes(Path());
@@ -208,11 +311,11 @@ TEST_F(Database, LeavesAloneWhatItCannotRead) {
     SCOPED_TRACE(row.name);
     WriteBytes(Path(), row.bytes);
     ThumbnailDatabase odd;
-    ASSERT_EQ(odd.Open(Path(), true), row.opens ? Opened::Done : Opened::NotRead);
+    ASSERT_EQ(odd.OpenThumbnailDatabase(Path(), true), row.opens ? Opened::Done : Opened::NotRead);
     if (row.opens) {
       ThumbnailRecord found;
       EXPECT_EQ(odd.Find("/b", "v", found), row.findsB);
-      EXPECT_EQ(odd.Compact(false), row.compacts);
+      EXPECT_EQ(odd.CompactThumbnailDatabase(false), row.compacts);
       if (row.compacts != Compacted::Done) {
         EXPECT_EQ(ReadBytes(Path()), row.bytes);
       }
@@ -244,12 +347,12 @@ TEST_F(Database, PurgesOnlyWhereItCanTell) {
     SCOPED_TRACE(row.name);
     std::filesystem::remove(Path());
     ThumbnailDatabase database;
-    ASSERT_EQ(database.Open(Path(), true), Opened::Done);
+    ASSERT_EQ(database.OpenThumbnailDatabase(Path(), true), Opened::Done);
     ASSERT_TRUE(Append(database, "/nowhere/at/all", "v:1", 1));
     ASSERT_TRUE(Append(database, folder_.Path("there"), "v:1", 2));
     kind = row.kind;
     label = row.label;
-    ASSERT_EQ(database.Compact(true), Compacted::Done);
+    ASSERT_EQ(database.CompactThumbnailDatabase(true), Compacted::Done);
     EXPECT_EQ(Records().size(), row.purged ? 1u : 2u);
     EXPECT_EQ(Records().back(), folder_.Path("there") + " v:1 2");
   }
@@ -257,16 +360,16 @@ TEST_F(Database, PurgesOnlyWhereItCanTell) {
 
 TEST_F(Database, FaultsLoseNoRecord) {
   ThumbnailDatabase database;
-  ASSERT_EQ(database.Open(Path(), true), Opened::Done);
+  ASSERT_EQ(database.OpenThumbnailDatabase(Path(), true), Opened::Done);
   ASSERT_TRUE(Append(database, "/a", "v", 1));
   ASSERT_TRUE(Append(database, "/b", "v", 2));
   ASSERT_EQ(database.Delete("/b"), 1);
-  database.Close();
+  database.CloseThumbnailDatabase();
   const std::vector<uint8_t> start = ReadBytes(Path());
   int64_t faults = ForEachFault([&] {
     WriteBytes(Path(), start);
     ThumbnailDatabase odd;
-    const bool added = odd.Open(Path(), true) == Opened::Done && Append(odd, "/a", "v", 3, true);
+    const bool added = odd.OpenThumbnailDatabase(Path(), true) == Opened::Done && Append(odd, "/a", "v", 3, true);
     const int64_t left = platform::faultCountdown.exchange(0);
     const std::vector<std::string> records = Records();
     ASSERT_GE(records.size(), 2u);
@@ -275,7 +378,7 @@ TEST_F(Database, FaultsLoseNoRecord) {
     }
     ThumbnailDatabase after;
     ThumbnailRecord found;
-    EXPECT_EQ(after.Open(Path(), false), Opened::Done);
+    EXPECT_EQ(after.OpenThumbnailDatabase(Path(), false), Opened::Done);
     EXPECT_TRUE(after.Find("/a", "v", found));
     platform::faultCountdown = left;
   });
@@ -283,7 +386,7 @@ TEST_F(Database, FaultsLoseNoRecord) {
   faults = ForEachFault([&] {
     WriteBytes(Path(), start);
     ThumbnailDatabase odd;
-    const bool done = odd.Open(Path(), false) == Opened::Done && odd.Compact(false) == Compacted::Done;
+    const bool done = odd.OpenThumbnailDatabase(Path(), false) == Opened::Done && odd.CompactThumbnailDatabase(false) == Compacted::Done;
     const int64_t left = platform::faultCountdown.exchange(0);
     if (done) {
       EXPECT_THAT(Records(), ElementsAre("/a v 1"));
@@ -297,14 +400,14 @@ TEST_F(Database, FaultsLoseNoRecord) {
 }
 
 TEST_F(Database, TwoProcessesAppendAndCompact) {
-  { ASSERT_EQ(ThumbnailDatabase().Open(Path(), true), Opened::Done); }
+  { ASSERT_EQ(ThumbnailDatabase().OpenThumbnailDatabase(Path(), true), Opened::Done); }
   constexpr int kEach = 25;
   const auto add = [&](const std::string& name) {
     ThumbnailDatabase database;
-    if (database.Open(Path(), true) != Opened::Done) _exit(1);
+    if (database.OpenThumbnailDatabase(Path(), true) != Opened::Done) _exit(1);
     for (int i = 0; i < kEach; ++i) {
       if (!Append(database, "/" + name + std::to_string(i), "v", 1)) _exit(2);
-      if (i % 10 == 9 && database.Compact(false) != Compacted::Done) _exit(3);
+      if (i % 10 == 9 && database.CompactThumbnailDatabase(false) != Compacted::Done) _exit(3);
     }
   };
   const pid_t child = fork();
@@ -329,11 +432,11 @@ TEST_F(Database, AKilledWriterLosesNothingReported) {
     const pid_t child = fork();
     if (child == 0) {
       ThumbnailDatabase database;
-      if (database.Open(Path(), true) != Opened::Done) _exit(1);
+      if (database.OpenThumbnailDatabase(Path(), true) != Opened::Done) _exit(1);
       for (int i = 0;; ++i) {
         if (!Append(database, "/" + std::to_string(round) + "-" + std::to_string(i), "v", 1)) _exit(2);
         if (write(reported[1], "x", 1) != 1) _exit(3);
-        if (i % 5 == 4 && database.Compact(false) != Compacted::Done) _exit(4);
+        if (i % 5 == 4 && database.CompactThumbnailDatabase(false) != Compacted::Done) _exit(4);
       }
     }
     close(reported[1]);
@@ -348,22 +451,22 @@ TEST_F(Database, AKilledWriterLosesNothingReported) {
     if (!std::filesystem::exists(Path())) continue;
     EXPECT_GE(Records().size(), had + count);
     ThumbnailDatabase database;
-    EXPECT_EQ(database.Open(Path(), true), Opened::Done);
-    EXPECT_EQ(database.Compact(false), Compacted::Done);
+    EXPECT_EQ(database.OpenThumbnailDatabase(Path(), true), Opened::Done);
+    EXPECT_EQ(database.CompactThumbnailDatabase(false), Compacted::Done);
     EXPECT_THAT(folder_.Names(), ElementsAre("Fotomill.tdb"));
   }
 }
 
 TEST_F(Database, AFullDiskFailsAndCountsNothing) {
   ThumbnailDatabase database;
-  ASSERT_EQ(database.Open(Path(), true), Opened::Done);
+  ASSERT_EQ(database.OpenThumbnailDatabase(Path(), true), Opened::Done);
   ASSERT_TRUE(Append(database, "/a", "v", 1));
   const int status = InChild([&] {
     signal(SIGXFSZ, SIG_IGN);
     const rlimit limit{40000, 40000};
     setrlimit(RLIMIT_FSIZE, &limit);
     ThumbnailDatabase full;
-    _exit(full.Open(Path(), true) == Opened::Done && !Append(full, "/b", "v", 2) ? 0 : 1);
+    _exit(full.OpenThumbnailDatabase(Path(), true) == Opened::Done && !Append(full, "/b", "v", 2) ? 0 : 1);
   });
   EXPECT_EQ(status, 0);
   EXPECT_THAT(Records(), ElementsAre("/a v 1"));

@@ -198,9 +198,9 @@ TEST_F(Lookup, TakesTheSystemsThumbnailWhileItIsValid) {
 TEST_F(Lookup, AsksWhereTheModeSays) {
   const ScopedSettings keep;
   ThumbnailDatabase database;
-  ASSERT_EQ(database.Open(folder_.Path("Fotomill.tdb"), true), ThumbnailDatabase::Opened::Done);
+  ASSERT_EQ(database.OpenThumbnailDatabase(folder_.Path("Fotomill.tdb"), true), ThumbnailDatabase::Opened::Done);
   const DatabaseRecord stored{Flat(3), picture_, VolumeKeyFor(picture_), false};
-  ASSERT_TRUE(database.Append({&stored, 1}, false));
+  ASSERT_TRUE(database.AppendDatabaseRecords({&stored, 1}, false));
   const ThumbnailRecord listed = Flat(2);
   PutSystemThumbnail(0, FileUri(picture_));
   constexpr int kNone = 0, kFile = 1, kList = 2, kDatabase = 3, kSystem = 4;
