@@ -137,8 +137,8 @@ std::string PlannedDestination(const std::string& source, std::string_view below
   name.append(parts.base).append(1, '.');
   name += CasedExtension(ExtensionOfFormat(job), platform::ExtensionOf(source), job.naming.extensionCase);
   if (job.naming.beside || job.destinationFolder.empty()) return platform::JoinPath({parts.drive, parts.folder, name, {}});
-  if (below.empty()) return platform::JoinFolder(job.destinationFolder.view(), name);
-  return platform::JoinFolder(platform::JoinFolder(job.destinationFolder.view(), below), name);
+  if (below.empty()) return platform::JoinFolder(job.destinationFolder, name);
+  return platform::JoinFolder(platform::JoinFolder(job.destinationFolder, below), name);
 }
 
 std::optional<std::string> CompletedDestination(const std::string& destination, std::string_view folder) {

@@ -48,7 +48,7 @@ struct BatchJob {
   int32_t formatIndex = kNoFormat;  // of the outputs
   std::string extension;            // of the outputs, without dot; empty: the format's own. A plug-in format's has to be
                                     // kept, as its row may serve another one meanwhile
-  PathText destinationFolder;       // empty: beside the source
+  std::string destinationFolder;    // empty: beside the source
   ProgressBox* box = nullptr;       // or none; not owned
   Prompts* prompts = nullptr;       // none: nobody can be asked; not owned
   bool errors = false;              // a file failed
@@ -67,13 +67,13 @@ struct BatchJob {
 
 // What became of one file.
 struct FileOutcome {
-  std::string source;
-  std::string destination;     // Ok: where its output is, or would be in a dry run. Skipped: the file that is in the way
+  std::string source = {};
+  std::string destination = {};  // Ok: where its output is, or would be in a dry run. Skipped: the file that is in the way
   Status status = Status::Ok;
-  std::string hint;            // a sentence that goes behind the message; empty when there is nothing to add
+  std::string hint = {};       // a sentence that goes behind the message; empty when there is nothing to add
   bool skipped = false;        // left out by choice or for want of a name; not a failure
   bool replaced = false;       // the output took the place of a file
-  std::string note;            // a remark that is no failure; empty when there is none
+  std::string note = {};       // a remark that is no failure; empty when there is none
 };
 
 }  // namespace fotomill

@@ -43,7 +43,7 @@ bool AsksEveryName(const BatchJob& job) {
 }
 
 FileOutcome Failure(const BatchFile& file, Status status, std::string hint = {}) {
-  return {.source = file.name, .destination = {}, .status = status, .hint = std::move(hint), .note = {}};
+  return {.source = file.name, .status = status, .hint = std::move(hint)};
 }
 
 class Batch {
@@ -140,7 +140,7 @@ class Batch {
   static FileOutcome Cancelled(const BatchFile& file) { return Failure(file, Status::FunctionCancelled); }
 
   static FileOutcome Skipped(const BatchFile& file, const Destination& destination) {
-    FileOutcome outcome{.source = file.name, .destination = destination.path, .hint = {}, .skipped = true, .note = {}};
+    FileOutcome outcome{.source = file.name, .destination = destination.path, .skipped = true};
     if (destination.noVariant) {
       outcome.status = Status::ErrorCreatingFile;
       outcome.destination.clear();
@@ -267,15 +267,13 @@ class Batch {
       return MakeVariant(path, [&](const std::string& candidate) { return names_.Taken(candidate, source); });
     };
     DestinationAnswer answer = MakeDestinationName(destination, source, {}, job_, taken, variant, &picture);
-    // Unless the user said so of this very file, the files of one run never replace each other.
-    if (answer == DestinationAnswer::Write && destination.replace && !destination.asked && IsOfRun(destination.path, source)) {
-      destination.replace = destination.recycle = false;
-      if (!variant(destination.path)) {
-        destination.noVariant = true;
-        answer = DestinationAnswer::Skip;
-      }
-    }
     const std::lock_guard lock(mutex_);
+    // Unless the user said so of this very file, the files of one run never replace each other.
+    if (answer == DestinationAnswer::Write && destination.replace && !destination.asked) {
+      const TakenTest ofRun = [&](const std::string& path) { return names_.TakenByRun(path, source); };
+      destination.noVariant = ofRun(destination.path) && !MakeVariant(destination.path, ofRun);
+      if (destination.noVariant) answer = DestinationAnswer::Skip;
+    }
     TakeRules();
     if (answer == DestinationAnswer::Write) names_.Give(destination.path);
     return answer;
@@ -284,11 +282,6 @@ class Batch {
   bool IsTaken(const std::string& path, const std::string& source) const {
     const std::lock_guard lock(mutex_);
     return names_.Taken(path, source);
-  }
-
-  bool IsOfRun(const std::string& path, const std::string& source) const {
-    const std::lock_guard lock(mutex_);
-    return names_.TakenByRun(path, source);
   }
 
   bool MakeVariant(std::string& path, const TakenTest& taken) {
@@ -323,18 +316,18 @@ class Batch {
     if (function_.keepTimes && !function_.dryRun && !platform::CopyTimes(file.name, destination.path)) {
       return Failure(file, Status::ErrorWritingFile, destination.path + " was written, but its time could not be set.");
     }
-    return {.source = file.name, .destination = destination.path, .hint = {}, .replaced = replaces, .note = LostMetadata(picture)};
+    return {.source = file.name, .destination = destination.path, .replaced = replaces, .note = LostMetadata(picture)};
   }
 
   // Metadata that the format cannot hold are not lost in silence, for who wants to know.
   std::string LostMetadata(const PictureRecord& picture) const {
-    const FormatEntry& row = FormatRow(job_.formatIndex);
-    if (!function_.keepMetadata || picture.metadata.Empty() || KeepsMetadata(row)) return {};
+    const PictureMetadata& metadata = picture.metadata;
     std::string lost;
-    if (!picture.metadata.exif.empty()) lost += ", EXIF";
-    if (!picture.metadata.xmp.empty()) lost += ", XMP";
-    if (!picture.metadata.icc.empty()) lost += ", color profile";
-    return std::string(row.extension.view()) + " cannot hold its " + lost.substr(2) + ".";
+    if (!metadata.exif.empty() && (picture.lostMetadata & kLostExif) != 0) lost += ", EXIF";
+    if (!metadata.xmp.empty() && (picture.lostMetadata & kLostXmp) != 0) lost += ", XMP";
+    if (!metadata.icc.empty() && (picture.lostMetadata & kLostIcc) != 0) lost += ", color profile";
+    if (!function_.keepMetadata || lost.empty()) return {};
+    return UpperCase(job_.extension) + " cannot hold its " + lost.substr(2) + ".";
   }
 
   std::string WriteHint(const Destination& destination, Status status) const {
@@ -367,7 +360,7 @@ bool IsWanted(const BatchFunction& function, const BatchJob& job) {
     const std::string format(UpperCase(ExtensionOfFormat(job)));
     if (!job.prompts->ConfirmFormat("Write files to the " + format + " format?")) return false;
   }
-  const std::string folder(job.destinationFolder.view());
+  const std::string& folder = job.destinationFolder;
   const bool ownFolder = folder.empty() || job.naming.beside || !function.out.empty();
   return ownFolder || platform::FileExists(folder) || job.prompts->ConfirmNewFolder(folder);
 }

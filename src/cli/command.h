@@ -58,6 +58,8 @@ struct CommandContext {
   std::function<int()> run;  // after parsing; returns the exit status
 
   bool MayAsk() const { return io.Interactive() && !global.noInput; }
+  // Whether someone watches how far the command is.
+  bool ProgressOn() const { return io.errTerminal && !global.quiet && global.progress != "never"; }
   // Whether messages, or results, are coloured.
   bool ColorOn(bool terminal) const;
 };

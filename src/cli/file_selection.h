@@ -4,18 +4,14 @@
 #include <string>
 #include <vector>
 
+#include "batch/run.h"
 #include "cli/command.h"
-#include "core/status.h"
 
 namespace fotomill::cli {
 
-// A file that a command line asks for.
-struct SelectedFile {
-  std::string name;            // as given, or folder and name joined
-  std::string below;           // folder beneath the folder that was named, "" or "a/b": for outputs that keep the tree
-  Status status = Status::Ok;  // FileOpenError: it is not there, or the folder `name` cannot be read
-  std::string hint;            // what goes behind the message of such a failure
-};
+// A file that a command line asks for. Its name is as given, or folder and name joined; `below` is the folder beneath the
+// folder that was named.
+using SelectedFile = BatchFile;
 
 struct SelectionOptions {
   bool recursive = false;

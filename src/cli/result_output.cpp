@@ -1,5 +1,6 @@
 #include "cli/result_output.h"
 
+#include "batch/progress_model.h"
 #include "cli/shown_text.h"
 #include "platform/process.h"
 
@@ -49,7 +50,10 @@ void PutStatus(Json& object, Status status) {
 }
 
 ResultOutput::ResultOutput(const CommandContext& context, bool json)
-    : context_(context), json_(json), colored_(context.ColorOn(context.io.errTerminal)) {
+    : context_(context),
+      json_(json),
+      colored_(context.ColorOn(context.io.errTerminal)),
+      progress_(context.io.err, context.ProgressOn()) {
   if (json_) Write(context_.io.out, "[");
 }
 
@@ -65,13 +69,25 @@ std::string ResultOutput::ShownMessage(std::string_view name) const {
   return context_.io.errTerminal ? EscapeControls(name) : std::string(name);
 }
 
+void ResultOutput::ShowProgress(uint64_t done, uint64_t total) {
+  if (expected_ != total) progress_.Begin(expected_ = total);
+  progress_.Done(done);
+}
+
+void ResultOutput::MakeWay() {
+  progress_.Clear();
+  Deliver(true);
+}
+
 void ResultOutput::Line(std::string_view line) {
+  ClearForResult();
   Write(context_.io.out, line);
   Write(context_.io.out, "\n");
   Deliver(false);
 }
 
 void ResultOutput::Element(const Json& element) {
+  ClearForResult();
   Write(context_.io.out, begun_ ? ",\n" : "\n");
   Write(context_.io.out, SafeJson(element));
   Deliver(false);
@@ -86,11 +102,11 @@ void ResultOutput::Failure(std::string_view name, Status status, std::string_vie
   text += StatusMessage(status);
   if (colored_) text += kPlain;
   if (!hint.empty()) text += " " + ShownMessage(hint);
-  PrintMessage(text);
+  Message(text);
 }
 
 void ResultOutput::Note(std::string_view text) {
-  if (!context_.global.quiet) PrintMessage(text);
+  if (!context_.global.quiet) Message(text);
 }
 
 bool ResultOutput::GoesOn() const {
@@ -98,14 +114,11 @@ bool ResultOutput::GoesOn() const {
 }
 
 int ResultOutput::Finish() {
+  progress_.Clear();
   EndArray();
   if (!context_.global.quiet) {
-    if (failures_ > 0) PrintMessage("There were errors");
-    if (files_ == 1) {
-      PrintMessage("One file was processed.");
-    } else {
-      PrintMessage(files_ == 0 ? "No files were processed." : std::to_string(files_) + " files were processed.");
-    }
+    if (failures_ > 0) Message(kErrorsLine);
+    Message(CountLine(static_cast<uint32_t>(files_)));
   }
   return failures_ > 0 ? kExitFailed : kExitOk;
 }
@@ -119,12 +132,17 @@ void ResultOutput::EndArray() {
 }
 
 // Results that came before are on their way first, so that the two streams keep their order where they meet.
-void ResultOutput::PrintMessage(std::string_view text) {
-  Deliver(true);
+void ResultOutput::Message(std::string_view text) {
+  MakeWay();
   std::string line(text);
   line += "\n";
   Write(context_.io.err, line);
   std::fflush(context_.io.err);
+}
+
+// Where results and messages meet on one terminal, the line of the progress makes way for both.
+void ResultOutput::ClearForResult() {
+  if (context_.io.outTerminal) progress_.Clear();
 }
 
 // Sends results on their way. Those for a file may wait for others for a moment, as thousands of small writes cost more

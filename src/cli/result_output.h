@@ -7,6 +7,7 @@
 #include <string_view>
 
 #include "cli/command.h"
+#include "cli/terminal_progress.h"
 #include "core/status.h"
 
 namespace fotomill::cli {
@@ -45,6 +46,15 @@ class ResultOutput {
   void Failure(std::string_view name, Status status, std::string_view hint = {});
   // A remark on the standard error that is no failure; left out by --quiet.
   void Note(std::string_view text);
+  // A line on the standard error.
+  void Message(std::string_view text);
+
+  // How far the command is, for who watches it on a terminal.
+  void ShowProgress(uint64_t done, uint64_t total);
+  // Time to tell the time again.
+  void Tick() { progress_.Tick(); }
+  // Everything printed so far is on its way, and the line of the progress is gone: before a question.
+  void MakeWay();
 
   // False once the standard output takes nothing more, or the user has asked the program to end: loops over files end
   // then.
@@ -53,10 +63,11 @@ class ResultOutput {
   // Ends the array, prints the closing lines ("There were errors", "3 files were processed.") and returns the exit
   // status.
   int Finish();
+  // Ends the array: no results come any more.
+  void EndArray();
 
  private:
-  void EndArray();
-  void PrintMessage(std::string_view text);
+  void ClearForResult();
   void Deliver(bool now);
 
   const CommandContext& context_;
@@ -65,6 +76,8 @@ class ResultOutput {
   bool begun_ = false;  // the array has an element
   bool ended_ = false;
   std::chrono::steady_clock::time_point delivered_;
+  TerminalProgress progress_;
+  uint64_t expected_ = 0;
   uint64_t files_ = 0;
   uint64_t failures_ = 0;
 };

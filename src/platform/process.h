@@ -14,6 +14,10 @@ std::vector<std::string> ProgramFor(const std::string& file);
 
 bool IsTerminal(int stream);  // 0 standard input, 1 output, 2 error
 bool IsStored(int stream);    // goes to a regular file: nobody waits for what is written
+// Waits until the standard input has something to read, or has ended. False when the program was asked to end meanwhile.
+bool WaitForInput();
+// Whether what is typed on the terminal of the standard input shows up there. False when there is no such terminal.
+bool ShowTyping(bool show);
 int TerminalWidth();          // columns, 80 when unknown
 unsigned CoreCount();         // cores this process may use, at least 1
 

@@ -31,7 +31,7 @@ TEST(Progress, ClosingLines) {
     ASSERT_TRUE(OpenProgressBox(job));
     EXPECT_FALSE(job.errors || AbortAsked() || !job.progress.AbortLive() || job.progress.CloseLive());
     for (int i = 0; i < row.files; ++i) {
-      FileOutcome outcome{.source = "a", .destination = "b", .hint = {}, .note = {}};
+      FileOutcome outcome{.source = "a", .destination = "b"};
       if (i < row.failed) outcome.status = Status::DamagedFile;
       ReportOutcome(job, outcome, i, row.files);
     }

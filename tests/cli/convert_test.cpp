@@ -6,7 +6,6 @@
 #include <filesystem>
 #include <nlohmann/json.hpp>
 
-#include "cli/output_names.h"
 #include "support/bitmaps.h"
 #include "support/command_line.h"
 #include "support/files.h"
@@ -235,22 +234,6 @@ TEST_F(Convert, PagesBeyondTheLast) {
   const CommandResult result = Run({In("a.bmp"), "-t", "pcx", "--page", "2"});
   EXPECT_EQ(result.status, 1);
   EXPECT_THAT(result.err, HasSubstr("No images in this document. It has one page."));
-}
-
-TEST(OutputNames, ExtensionsFollowTheSourcesCase) {
-  const struct {
-    const char *format, *source;
-    const char* styles[3];
-  } rows[] = {
-      {"TIF", "Jpg", {"Tif", "TIF", "tif"}}, {"JPEG", "BMP", {"JPEg", "JPEg", "jpeg"}},
-      {"PCX", "bmp", {"pcx", "PCX", "pcx"}}, {"MP3", "PNG", {"MP3", "MP3", "mp3"}},
-      {"PCX", "", {"pcx", "pcx", "pcx"}},    {"PCX", "7Zx", {"pCx", "pCX", "pcx"}},
-  };
-  for (const auto& row : rows) {
-    for (int32_t style = 0; style < 3; ++style) {
-      EXPECT_EQ(cli::CasedExtension(row.format, row.source, style), row.styles[style]) << row.source << style;
-    }
-  }
 }
 
 }  // namespace

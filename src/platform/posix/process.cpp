@@ -1,12 +1,14 @@
 #include "platform/process.h"
 
 #include <fcntl.h>
+#include <poll.h>
 #include <sched.h>
 #include <signal.h>
 #include <spawn.h>
 #include <sys/ioctl.h>
 #include <sys/stat.h>
 #include <sys/wait.h>
+#include <termios.h>
 #include <unistd.h>
 
 #include <atomic>
@@ -119,6 +121,22 @@ bool IsTerminal(int stream) { return isatty(stream) == 1; }
 bool IsStored(int stream) {
   struct stat facts;
   return fstat(stream, &facts) == 0 && S_ISREG(facts.st_mode);
+}
+
+bool WaitForInput() {
+  constexpr int kPatienceMs = 100;  // a signal between the question and the wait is seen after it
+  pollfd input = {STDIN_FILENO, POLLIN, 0};
+  while (PendingExit() == 0) {
+    if (poll(&input, 1, kPatienceMs) > 0) return true;
+  }
+  return false;
+}
+
+bool ShowTyping(bool show) {
+  termios modes;
+  if (tcgetattr(STDIN_FILENO, &modes) != 0) return false;
+  modes.c_lflag = show ? modes.c_lflag | ECHO : modes.c_lflag & ~static_cast<tcflag_t>(ECHO);
+  return tcsetattr(STDIN_FILENO, TCSAFLUSH, &modes) == 0;
 }
 
 int TerminalWidth() {

@@ -1,0 +1,182 @@
+#include "batch/destination_name.h"
+
+#include <gtest/gtest.h>
+
+#include <set>
+
+#include "batch/prompts.h"
+
+namespace fotomill::test {
+namespace {
+
+// Gives one answer after the other, and keeps what it was asked.
+class ScriptedPrompts : public Prompts {
+ public:
+  std::vector<OverwriteAnswer> answers;
+  std::vector<std::optional<std::string>> names;
+  std::vector<OverwriteQuestion> questions;
+  std::vector<std::string> stored;
+
+  std::optional<std::string> AskDestinationName(const NameQuestion&) override {
+    const auto name = names.empty() ? std::nullopt : names.front();
+    if (!names.empty()) names.erase(names.begin());
+    return name;
+  }
+  OverwriteAnswer AskOverwrite(const OverwriteQuestion& question) override {
+    questions.push_back(question);
+    if (answers.empty()) return {};
+    OverwriteAnswer answer = answers.front();
+    answers.erase(answers.begin());
+    return answer;
+  }
+  std::optional<std::string> AskPassword(const std::string&) override { return std::nullopt; }
+  bool ConfirmFormat(const std::string&) override { return true; }
+  bool ConfirmNewFolder(const std::string&) override { return true; }
+  void StoreFlag(KeyNumber key, bool value) override {
+    stored.push_back(std::string(KeyOf(key).name) + (value ? "=1" : "=0"));
+  }
+};
+
+int32_t RowOf(std::string_view extension) { return FindFormatByName("x." + std::string(extension)); }
+
+// The outcome in short: the path with "!" in front when it replaces a file, or why there is none.
+std::string Settle(BatchJob& job, const std::set<std::string>& there, const std::string& source) {
+  job.formatIndex = RowOf("tif");
+  Destination destination;
+  destination.path = PlannedDestination(source, {}, {}, job);
+  const TakenTest taken = [&](const std::string& path) { return there.contains(path); };
+  const VariantMaker variant = [&](std::string& path) {
+    return MakeNumberedVariant(path, job.naming.firstVariant, job.naming.lastVariant, taken);
+  };
+  if (MakeDestinationName(destination, source, {}, job, taken, variant) == DestinationAnswer::Skip) {
+    return destination.noVariant ? "no variant" : "skipped";
+  }
+  return (destination.replace ? destination.recycle ? "!~" : "!" : "") + destination.path;
+}
+
+TEST(DestinationName, ExtensionsFollowTheSourcesCase) {
+  const struct {
+    const char *format, *source;
+    const char* styles[3];
+  } rows[] = {
+      {"TIF", "Jpg", {"Tif", "TIF", "tif"}}, {"JPEG", "BMP", {"JPEg", "JPEg", "jpeg"}},
+      {"PCX", "bmp", {"pcx", "PCX", "pcx"}}, {"MP3", "PNG", {"MP3", "MP3", "mp3"}},
+      {"PCX", "", {"pcx", "pcx", "pcx"}},    {"PCX", "7Zx", {"pCx", "pCX", "pcx"}},
+  };
+  for (const auto& row : rows) {
+    for (int32_t style = 0; style < 3; ++style) {
+      EXPECT_EQ(CasedExtension(row.format, row.source, style), row.styles[style]) << row.source << style;
+    }
+  }
+}
+
+TEST(DestinationName, FolderPrefixAndTree) {
+  const struct {
+    const char *source, *below, *prefix, *folder, *path;
+    bool beside;
+  } rows[] = {
+      {"in/PHOTO.Jpg", "", "", "", "in/PHOTO.Tif", false},
+      {"in/a.b.bmp", "", "Cropped_ ", "out", "out/Cropped_ a.b.tif", false},
+      {"a", "", "Duplicate of ", "out/", "out/Duplicate of a.tif", false},
+      {"in/one/a.bmp", "one", "", "out", "out/one/a.tif", false},
+      {"in/one/a.bmp", "one", "", "out", "in/one/a.tif", true},
+  };
+  for (const auto& row : rows) {
+    BatchJob job;
+    job.formatIndex = RowOf("tif");
+    job.destinationFolder = row.folder;
+    job.naming.beside = row.beside;
+    EXPECT_EQ(PlannedDestination(row.source, row.below, row.prefix, job), row.path);
+  }
+  EXPECT_EQ(CompletedDestination("name", "out"), "out/name");
+  EXPECT_EQ(CompletedDestination("other/name", "out"), "other/name");
+  EXPECT_EQ(CompletedDestination("name", std::string(255, 'f')), std::string(255, 'f') + "/name");
+  EXPECT_EQ(CompletedDestination("names", std::string(255, 'f')), std::nullopt);
+}
+
+TEST(DestinationName, WhatBecomesOfATakenName) {
+  const OverwriteChecks ask{}, replace{.keepBoth = false};
+  const struct {
+    const char* name;
+    OverwritePolicy policy;
+    bool applyToRest, prompts;
+    std::vector<OverwriteAnswer> answers;
+    const char* outcome;
+    size_t questions;
+    std::vector<std::string> stored = {};
+  } rows[] = {
+      {"nobody to ask", {.keepBoth = false}, false, false, {}, "a [2].tif", 0},
+      {"no prompt", {.prompt = false}, false, true, {}, "!a.tif", 0},
+      {"no prompt, recycled", {.prompt = false, .recycle = true}, false, true, {}, "!~a.tif", 0},
+      {"left out", {.skip = true}, false, true, {}, "skipped", 0},
+      {"applied to the rest, both", {}, true, true, {}, "a [2].tif", 0},
+      {"applied to the rest", {.keepBoth = false}, true, true, {}, "!a.tif", 0},
+      {"cancelled", {}, false, true, {{}}, "skipped", 1},
+      {"both", {}, false, true, {{true, ask, "b", false}}, "a [2].tif", 1},
+      {"replaced", {}, false, true, {{true, replace, "a", false}}, "!a.tif", 1, {"OverwriteKeepBoth=0"}},
+      {"renamed", {.keepBoth = false}, false, true, {{true, replace, "new", false}}, "new.tif", 1},
+      {"renamed to a taken one, then cancelled", {.keepBoth = false}, false, true, {{true, replace, "b", false}}, "skipped", 2},
+      {"renamed to a taken one, for all", {.keepBoth = false}, false, true,
+       {{true, {.keepBoth = false, .applyToRest = true}, "b", false}}, "!b.tif", 1},
+      {"a name that leads elsewhere", {.keepBoth = false}, false, true,
+       {{true, replace, "../b", false}, {true, replace, "", false}, {true, replace, "c", false}}, "c.tif", 3},
+      {"never again, into the bin", {.keepBoth = false}, false, true,
+       {{true, {.notify = false, .keepBoth = false, .recycle = true, .previews = false}, "a", false}}, "!~a.tif", 1,
+       {"PromptBeforeOverwrite=0", "OverwritePromptRecycle=1", "OverwritePromptPreviews=0"}},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    ScriptedPrompts prompts;
+    prompts.answers = row.answers;
+    BatchJob job;
+    job.overwrite = row.policy;
+    job.applyToRest = row.applyToRest;
+    job.prompts = row.prompts ? &prompts : nullptr;
+    EXPECT_EQ(Settle(job, {"a.tif", "a [1].tif", "b.tif"}, "a.bmp"), row.outcome);
+    EXPECT_EQ(prompts.questions.size(), row.questions);
+    EXPECT_EQ(prompts.stored, row.stored);
+  }
+}
+
+TEST(DestinationName, AnswersHoldForTheRest) {
+  ScriptedPrompts prompts;
+  prompts.answers = {{true, {.applyToRest = true}, "a", false}};
+  BatchJob job;
+  job.prompts = &prompts;
+  const std::set<std::string> there{"a.tif", "b.tif", "c.tif"};
+  EXPECT_EQ(Settle(job, there, "a.bmp"), "a [1].tif");
+  EXPECT_EQ(Settle(job, there, "b.bmp"), "b [1].tif");
+
+  prompts.answers = {{.checks = {}, .name = {}, .skipRest = true}};
+  job.applyToRest = false;
+  EXPECT_EQ(Settle(job, there, "b.bmp"), "skipped");
+  EXPECT_EQ(Settle(job, there, "c.bmp"), "skipped");
+  EXPECT_EQ(prompts.questions.size(), 2u);
+}
+
+TEST(DestinationName, TypedNamesAndVariants) {
+  ScriptedPrompts prompts;
+  BatchJob job;
+  job.prompts = &prompts;
+  job.naming.askName = true;
+  prompts.names = {"bad\nname", "else.where"};
+  EXPECT_EQ(Settle(job, {}, "in/a.BMP"), "in/else.TIF");
+  prompts.names = {"/other/b.tif"};
+  EXPECT_EQ(Settle(job, {"/other/b.tif"}, "in/a.bmp"), "skipped");  // the overwrite prompt was cancelled
+  EXPECT_EQ(Settle(job, {}, "in/a.bmp"), "skipped");
+  job.naming.askName = false;
+
+  job.applyToRest = true;
+  const struct {
+    int32_t first, last;
+    const char* outcome;
+  } rows[] = {{2, 1, "no variant"}, {1, 2, "no variant"}, {1, 3, "a [3].tif"}, {-1, INT32_MAX, "a [-1].tif"}, {INT32_MAX, INT32_MAX, "a [2147483647].tif"}};
+  for (const auto& row : rows) {
+    job.naming.firstVariant = row.first;
+    job.naming.lastVariant = row.last;
+    EXPECT_EQ(Settle(job, {"a.tif", "a [1].tif", "a [2].tif"}, "a.bmp"), row.outcome);
+  }
+}
+
+}  // namespace
+}  // namespace fotomill::test

@@ -1,0 +1,174 @@
+#include "batch/run.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <atomic>
+#include <filesystem>
+#include <map>
+#include <thread>
+
+#include "batch/abort.h"
+#include "support/bitmaps.h"
+#include "support/faults.h"
+#include "support/files.h"
+#include "support/scoped_environment.h"
+#include "support/scoped_settings.h"
+
+namespace fotomill::test {
+namespace {
+
+namespace fs = std::filesystem;
+
+class Run : public testing::Test {
+ protected:
+  std::string In(const std::string& name) const { return folder_.Path(name); }
+
+  BatchJob NewJob() const {
+    BatchJob job;
+    job.formatIndex = FindFormatByName("x.pcx");
+    job.destinationFolder = In("out");
+    return job;
+  }
+  std::map<std::string, std::vector<uint8_t>> Outputs() const {
+    std::map<std::string, std::vector<uint8_t>> outputs;
+    for (const auto& entry : fs::recursive_directory_iterator(In("out"))) {
+      if (entry.is_regular_file()) outputs[entry.path().string()] = ReadBytes(entry.path());
+    }
+    return outputs;
+  }
+  static std::vector<std::string> LinesOf(const BatchJob& job) {
+    std::vector<std::string> lines;
+    for (const ProgressLine& line : job.progress.Lines()) lines.push_back(line.text);
+    return lines;
+  }
+
+  TemporaryFolder folder_;
+  const ScopedSettings keep_;
+};
+
+TEST_F(Run, SeveralAtATimeGiveWhatOneAfterTheOtherGives) {
+  std::vector<BatchFile> files;
+  for (const char* folder : {"one", "two", "three"}) {
+    fs::create_directory(In(folder));
+    for (const char* name : {"a", "a [1]", "b", "c [2]", "c"}) {
+      const std::string path = In(folder) + "/" + name + ".bmp";
+      // Sizes that take different times, so that threads overtake each other.
+      const int32_t side = 10 + static_cast<int32_t>(files.size() * 7919 % 13) * 60;
+      WriteBytes(path, BitmapFile(side, side, 24));
+      files.push_back({path, {}, Status::Ok, {}});
+    }
+    WriteText(In(folder) + "/b.bmp", "broken");
+    files.push_back({In("none.bmp"), {}, Status::FileOpenError, "There is no such file."});
+    files.push_back({In("vanished.bmp"), {}, Status::Ok, {}});
+  }
+  const struct {
+    const char* name;
+    OverwritePolicy policy;
+    bool applyToRest;
+  } rows[] = {
+      {"keep both", {}, true},
+      {"replace", {.prompt = false}, false},
+      {"leave out", {.skip = true}, false},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    std::vector<std::string> lines;
+    std::map<std::string, std::vector<uint8_t>> outputs;
+    for (const uint32_t jobs : {1u, 2u, 7u}) {
+      fs::remove_all(In("out"));
+      fs::create_directory(In("out"));
+      WriteText(In("out/c.pcx"), "old");
+      WriteText(In("out/a [1] [1].pcx"), "old");
+      BatchJob job = NewJob();
+      job.overwrite = row.policy;
+      job.applyToRest = row.applyToRest;
+      ASSERT_EQ(RunBatch(files, {.jobs = jobs}, job), Status::Ok);
+      EXPECT_TRUE(job.errors);
+      EXPECT_EQ(job.uses.size(), std::count_if(job.progress.Lines().begin(), job.progress.Lines().end(), [](const auto& line) {
+                  return line.item.file >= 0 && line.item.status == Status::Ok && !line.item.skipped;
+                }));
+      if (jobs == 1) {
+        lines = LinesOf(job);
+        outputs = Outputs();
+      }
+      EXPECT_EQ(LinesOf(job), lines) << jobs;
+      EXPECT_EQ(Outputs(), outputs) << jobs;
+    }
+    EXPECT_EQ(lines.back(), "21 files were processed.");
+  }
+}
+
+TEST_F(Run, ASourceWaitsForTheOutputThatTakesItsPlace) {
+  // Each file's output is the next one's source, and replaces it: the last output holds the first picture.
+  for (const uint32_t jobs : {1u, 4u}) {
+    WriteBytes(In("a.dib"), BitmapFile(300, 300, 24));
+    WriteBytes(In("a.bmp"), BitmapFile(5, 5, 24));
+    const std::vector<BatchFile> files{{In("a.dib"), {}, Status::Ok, {}}, {In("a.bmp"), {}, Status::Ok, {}}};
+    BatchJob job = NewJob();
+    job.formatIndex = FindFormatByName("x.bmp");
+    job.destinationFolder.clear();
+    job.overwrite.prompt = false;
+    ASSERT_EQ(RunBatch(files, {.jobs = jobs}, job), Status::Ok);
+    EXPECT_EQ(job.progress.Lines()[0].text, In("a.dib") + " -> " + In("a [1].bmp"));  // a source is not replaced
+    EXPECT_EQ(job.progress.Lines()[1].text, In("a.bmp") + " -> " + In("a.bmp"));
+    EXPECT_EQ(ReadBytes(In("a [1].bmp")).size(), ReadBytes(In("a.dib")).size());
+  }
+}
+
+TEST_F(Run, NeverMorePicturesThanJobsAndNothingBegunAfterAbort) {
+  std::vector<BatchFile> files;
+  for (int i = 0; i < 60; ++i) {
+    files.push_back({In("p" + std::to_string(i) + ".bmp"), {}, Status::Ok, {}});
+    WriteBytes(files.back().name, BitmapFile(8, 8, 24));
+  }
+  for (const uint32_t jobs : {1u, 3u}) {
+    fs::remove_all(In("out"));
+    std::atomic<int> now{0}, most{0}, begun{0};
+    BatchJob job = NewJob();
+    const auto transform = [&](PictureRecord&) {
+      most = std::max<int>(most, ++now);
+      if (++begun == 20) Abort();
+      std::this_thread::sleep_for(std::chrono::milliseconds(1));
+      --now;
+      return Status::Ok;
+    };
+    ASSERT_EQ(RunBatch(files, {.transform = transform, .jobs = jobs}, job), Status::Ok);
+    EXPECT_LE(most, static_cast<int>(jobs));
+    EXPECT_LE(begun, 20 + static_cast<int>(jobs));
+    EXPECT_EQ(Outputs().size(), begun);  // what was begun is whole
+    EXPECT_EQ(job.progress.Files(), begun);
+    EXPECT_EQ(LinesOf(job).back(), CountLine(begun));
+  }
+}
+
+TEST_F(Run, WhateverFailsNoFileIsLost) {
+  const std::string bin = In("home/Trash/files/a.pcx");
+  const ScopedEnvironment environment("XDG_DATA_HOME", In("home"));
+  WriteBytes(In("a.bmp"), BitmapFile(8, 8, 24));
+  const BatchFile file{In("a.bmp"), {}, Status::Ok, {}};
+  for (const bool recycle : {false, true}) {
+    SCOPED_TRACE(recycle);
+    const int64_t faults = ForEachFault([&] {
+      const int64_t planned = platform::faultCountdown.exchange(0);
+      fs::remove_all(In("out"));
+      fs::remove_all(In("home"));
+      fs::create_directories(In("home"));
+      fs::create_directory(In("out"));
+      WriteText(In("out/a.pcx"), "old");
+      BatchJob job = NewJob();
+      job.overwrite = {.prompt = false, .recycle = recycle};
+      platform::faultCountdown = planned;
+      ASSERT_EQ(RunBatch({&file, 1}, {}, job), Status::Ok);
+      const bool there = fs::exists(In("out/a.pcx")), old = there && ReadText(In("out/a.pcx")) == "old";
+      EXPECT_EQ(job.errors, !there || old);
+      EXPECT_EQ(old || (there && !recycle) || (fs::exists(bin) && ReadText(bin) == "old"), true);
+      EXPECT_EQ(Outputs().size(), there);
+    });
+    EXPECT_GT(faults, 4);
+  }
+}
+
+}  // namespace
+}  // namespace fotomill::test
