@@ -52,6 +52,7 @@ struct Outcome {
   std::string hint;  // behind the message
   std::string name;  // of the file that the message is about, the picture's own when empty
   bool hasExif = false;
+  bool cutShort = false;  // there is more of it than a walk takes
 };
 
 Outcome WriteThumbnail(std::span<const uint8_t> bytes, const ExifOptions& options) {
@@ -87,6 +88,7 @@ Outcome WalkFile(const SelectedFile& file, const ExifOptions& options, ExifSink&
   Outcome outcome;
   if (!options.thumbnail.empty()) outcome = WriteThumbnail(ExifThumbnail(block, findings), options);
   outcome.hasExif = !block.empty();
+  outcome.cutShort = findings.cutShort;
   if (!source.Intact()) return {Status::FileReadError, "The file became shorter meanwhile.", {}};
   return outcome;
 }
@@ -108,6 +110,7 @@ class ExifRun {
       if (!outcome.hasExif && !options_.json) {
         output_.Note(output_.ShownMessage(file.name) + ": There is no EXIF in this file.");
       }
+      if (outcome.cutShort) output_.Note(output_.ShownMessage(file.name) + ": There is more EXIF than is shown here.");
     }
   }
 

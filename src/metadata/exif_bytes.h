@@ -46,6 +46,11 @@ class ExifBytes {
   bool bigEndian_ = false;
 };
 
+// Types that TIFF knows and EXIF does not. Sources: TIFF 6.0, section 2; Adobe PageMaker 6.0 TIFF Technical Notes (1995).
+inline constexpr uint16_t kTiffFloat = 11;
+inline constexpr uint16_t kTiffDouble = 12;
+inline constexpr uint16_t kTiffIfd = 13;
+
 // Sizes of a directory: a 2-byte count, the entries, a 4-byte offset of the next directory.
 //
 //   offset size  field of an entry
@@ -57,7 +62,8 @@ inline constexpr uint64_t kExifCountSize = 2;
 inline constexpr uint64_t kExifEntrySize = 12;
 inline constexpr uint64_t kExifLinkSize = 4;
 
-// Bytes that one value of a type takes in the block: those of TIFF 6.0, so 2 for SSHORT; 1 for unknown types.
+// Bytes that one value of a type takes in the block: those of TIFF 6.0, so 2 for SSHORT; 1 for unknown types. FLOAT,
+// DOUBLE and IFD have no text, but an edit must know where their values end.
 constexpr uint32_t ExifStoredSize(uint16_t type) {
   switch (type) {
     case kExifShort:
@@ -65,9 +71,12 @@ constexpr uint32_t ExifStoredSize(uint16_t type) {
       return 2;
     case kExifLong:
     case kExifSLong:
+    case kTiffFloat:
+    case kTiffIfd:
       return 4;
     case kExifRational:
     case kExifSRational:
+    case kTiffDouble:
       return 8;
     default:
       return 1;

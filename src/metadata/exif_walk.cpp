@@ -46,6 +46,7 @@ class Walk {
       if (listing_) sink_->Directory(number, label);
       offset = WalkDirectory(offset, count, findings);
     }
+    findings.cutShort = ended_;
     return true;
   }
 
@@ -68,8 +69,9 @@ class Walk {
   }
 
   bool FirstVisit(uint32_t offset) {
-    if (visited_.size() >= limits.exifDirectories) return false;
     if (std::find(visited_.begin(), visited_.end(), offset) != visited_.end()) return false;
+    ended_ = visited_.size() >= limits.exifDirectories;
+    if (ended_) return false;
     visited_.push_back(offset);
     return true;
   }

@@ -95,7 +95,8 @@ TEST(ExifEdit, DropsTheThumbnail) {
 
 TEST(ExifEdit, CutsOffAThumbnailAtTheEnd) {
   BlockBuilder blocks;
-  const uint32_t first = blocks.Directory({kOrientation6});
+  const uint32_t first = blocks.Directory({kOrientation6, {0x830e, 12, 1, 0}});  // a DOUBLE that ends in zeros
+  blocks.Patch32(first + 2 + 12 + 8, blocks.Bytes(Hex("03 00 00 00 00 00 00 00")));
   const size_t size = blocks.block.size();
   const uint32_t second = blocks.Directory({{0x0201, 4, 1, 0}, {0x0202, 4, 1, 100}});
   blocks.Patch32(blocks.LinkOf(first), second);
