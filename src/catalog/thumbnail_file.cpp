@@ -6,6 +6,7 @@
 
 #include "core/settings.h"
 #include "core/text.h"
+#include "picture/registry.h"
 #include "platform/file_view.h"
 #include "platform/files.h"
 #include "platform/output_file.h"
@@ -67,6 +68,16 @@ bool WriteThumbnailFile(ThumbnailRecord& record, const std::string& path) {
 bool WriteThumbnailForPicture(const std::string& picturePath, const PictureRecord& picture, Color background) {
   ThumbnailRecord record;
   return MakeBlendedThumbnailRecord(record, picture, background) && WriteRecord(record, ThumbnailPathFor(picturePath));
+}
+
+Status MakeThumbnailOfFile(const std::string& picturePath, ThumbnailRecord& record) {
+  PicturePointer picture;
+  RETURN_IF_BAD(LoadPictureInfo(picturePath.c_str(), picture));
+  // The quick scaler's result depends on the size that it starts from.
+  if (settings.ThumbnailQuickResize == 0) picture->thumbnailSide = kSmallThumbnailSide;
+  RETURN_IF_BAD(ReadPicture(*picture));
+  if (picture->image.Empty()) return Status::EmptyImage;
+  return MakeThumbnailRecord(record, *picture) ? Status::Ok : Status::MemoryAllocationError;
 }
 
 std::optional<std::vector<std::string>> OrphanThumbnails(const std::string& folder, const std::vector<std::string>& names) {

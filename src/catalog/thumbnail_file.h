@@ -30,6 +30,10 @@ bool WriteThumbnailFile(ThumbnailRecord& record, const std::string& path);
 // Makes a record by MakeBlendedThumbnailRecord and writes the thumbnail file of a picture; attributes stay as they are.
 bool WriteThumbnailForPicture(const std::string& picturePath, const PictureRecord& picture, Color background);
 
+// Reads a picture, as small as it serves, and makes its record. Statuses of reading, EmptyImage when the format has no
+// pixels, or MemoryAllocationError; `record` is then as before.
+Status MakeThumbnailOfFile(const std::string& picturePath, ThumbnailRecord& record);
+
 // The thumbnail files of a folder to which none of the names in it belongs, the case of letters ignored: regular files,
 // not links, names that begin with "." left out; in byte order. nullopt when the folder cannot be read.
 std::optional<std::vector<std::string>> OrphanThumbnails(const std::string& folder, const std::vector<std::string>& names);

@@ -93,14 +93,8 @@ ThumbnailPointer LoadThumbnail(const ThumbnailWish& wish) {
 }
 
 Status WriteThumbnail(const std::string& path) {
-  PicturePointer picture;
-  RETURN_IF_BAD(LoadPictureInfo(path.c_str(), picture));
-  // The quick scaler's result depends on the size that it starts from.
-  if (settings.ThumbnailQuickResize == 0) picture->thumbnailSide = kSmallThumbnailSide;
-  RETURN_IF_BAD(ReadPicture(*picture));
   ThumbnailRecord record;
-  if (picture->image.Empty()) return Status::EmptyImage;
-  if (!MakeThumbnailRecord(record, *picture)) return Status::MemoryAllocationError;
+  RETURN_IF_BAD(MakeThumbnailOfFile(path, record));
   return WriteThumbnailFile(record, ThumbnailPathFor(path)) ? Status::Ok : Status::ErrorCreatingFile;
 }
 

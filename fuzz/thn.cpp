@@ -1,0 +1,28 @@
+#include "catalog/thumbnail_drawing.h"
+#include "catalog/thumbnail_file.h"
+#include "support/scratch_file.h"
+
+// A thumbnail file reads as a whole record or not at all, and what reads can be drawn and written back.
+extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
+  using namespace fotomill;
+  using fuzz::Require;
+  static const std::string path = fuzz::ScratchPath("a") + ".THN";
+  static fuzz::MemoryFile file;
+  const std::string& name = file.Fill(data, size);
+  AnyThumbnailRecord any;
+  ThumbnailRecord& record = std::get<ThumbnailRecord>(any);
+  record.bytes.fill(7);
+  const ThumbnailRecord before = record;
+  const bool read = ReadThumbnailFile(record, name);
+  Require(read == (size >= 4 && before.bytes != record.bytes && record.HasMagic(kSmallThumbnailMagic)));
+  if (!read) {
+    Require(record.bytes == before.bytes);
+    return 0;
+  }
+  static PackedImage bitmap;
+  if (bitmap.Empty()) Require(NewPackedImage(180, 180, nullptr, 24, bitmap) == Status::Ok);
+  Require(DrawThumbnailRecord(bitmap, any, static_cast<int8_t>(data[size - 1]), 0, data[size / 2]));
+  ThumbnailRecord again;
+  Require(WriteThumbnailFile(record, path) && ReadThumbnailFile(again, path) && again.bytes == record.bytes);
+  return 0;
+}
