@@ -1,7 +1,6 @@
 #include <wx/app.h>
 #include <wx/cmdline.h>
 
-#include "catalog/file_history.h"
 #include "core/configuration.h"
 #include "core/data_folder.h"
 #include "desktop/event_log.h"
@@ -52,7 +51,6 @@ class App : public wxApp {
     (void)LoadConfiguration();
     RunFormatStartup();
     EnablePlugins();
-    (void)LoadFileHistory();
     const Start start = StartFrom(argument_);
     auto* frame = new MainFrame;
     frame->OpenTab(platform::IsFolder(start.folder) ? start.folder : platform::CurrentFolder());
@@ -63,7 +61,6 @@ class App : public wxApp {
   }
 
   int OnExit() override {
-    (void)SaveFileHistory();
     RunFormatShutdown();
     return wxApp::OnExit();
   }

@@ -1,6 +1,7 @@
 #include "desktop/windows/commands.h"
 
 #include "core/choice_lists.h"
+#include "desktop/windows/batch_runner.h"
 #include "desktop/windows/main_frame.h"
 
 namespace fotomill::desktop {
@@ -107,6 +108,7 @@ constexpr Command kCommands[] = {
     {kGo, "Pre&vious tab",         "Ctrl+PageUp",  "Goes to the previous tab.", Needs::Nothing, PreviousTab},
 
     {kFunctions, "&View",          "Ctrl+Return",  "Shows the focused picture in a view window.", Needs::Files, View, "view", true},
+    {kFunctions, "&Convert...",    "Ctrl+E",       "Writes the selected pictures in another format.", Needs::Files, ConvertSelection, "convert", true},
 };
 // clang-format on
 

@@ -12,6 +12,7 @@
 #include "core/configuration.h"
 #include "core/settings.h"
 #include "desktop/event_log.h"
+#include "desktop/windows/batch_runner.h"
 #include "desktop/windows/bitmaps.h"
 #include "desktop/windows/commands.h"
 #include "desktop/windows/folder_tree.h"
@@ -26,12 +27,14 @@ namespace fotomill::desktop {
 namespace {
 
 constexpr const char* kTitle = "Fotomill Professional";
+constexpr int kHistoryMs = 2000;  // after the last use
 enum StatusField { kCountField, kMessageField, kFieldCount };
 
 }  // namespace
 
 MainFrame::MainFrame()
-    : wxFrame(nullptr, wxID_ANY, kTitle, wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE, "FotomillProfessional") {
+    : wxFrame(nullptr, wxID_ANY, kTitle, wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE, "FotomillProfessional"),
+      usesTimer_(this) {
   SetSize(FromDIP(wxSize(1180, 760)));
   BuildMenus();
   BuildToolbar();
@@ -40,10 +43,15 @@ MainFrame::MainFrame()
   const int widths[] = {-2, -3};
   SetStatusWidths(kFieldCount, widths);
   SetStatusBarPane(kMessageField);
+  batches_ = std::make_unique<BatchRunner>(*this);
   Bind(wxEVT_CLOSE_WINDOW, &MainFrame::OnClose, this);
+  Bind(wxEVT_TIMER, [this](wxTimerEvent&) { FlushUses(); }, usesTimer_.GetId());
 }
 
-MainFrame::~MainFrame() { thumbnails_.SetListener(nullptr); }
+MainFrame::~MainFrame() {
+  batches_.reset();
+  thumbnails_.SetListener(nullptr);
+}
 
 // --- menus ---
 
@@ -244,6 +252,31 @@ void MainFrame::SettingsChanged() {
   for (size_t tab = 0; tab < tabs_->GetPageCount(); ++tab) PageAt(tab)->Reload();
 }
 
+void MainFrame::SelectFiles(const std::vector<std::string>& files) {
+  BrowserPage* browser = Browser();
+  if (browser == nullptr) return;
+  BrowserModel& model = browser->Model();
+  model.Selected().SelectNone();
+  for (const std::string& file : files) {
+    const size_t line = platform::SplitPath(file).folder == platform::JoinFolder(model.Folder(), "") ? model.FindLine(platform::FileNameOf(file)) : kNoLine;
+    if (line != kNoLine) model.Selected().Set(line, true);
+  }
+  browser->SelectionChanged();
+}
+
+void MainFrame::FilesChanged() {
+  for (size_t tab = 0; tab < tabs_->GetPageCount(); ++tab) PageAt(tab)->Reload();
+}
+
+void MainFrame::NoteUses(const std::vector<FileUse>& uses) {
+  uses_.insert(uses_.end(), uses.begin(), uses.end());
+  if (!uses.empty()) usesTimer_.StartOnce(kHistoryMs);
+}
+
+void MainFrame::FlushUses() {
+  if (!uses_.empty()) (void)UpdateFileHistory(std::exchange(uses_, {}));
+}
+
 void MainFrame::Tell(const std::string& text) { SetStatusText(Shown(text), kMessageField); }
 
 // --- state ---
@@ -264,8 +297,14 @@ void MainFrame::LogState() {
 }
 
 void MainFrame::OnClose(wxCloseEvent& event) {
+  if (batches_->Running() && event.CanVeto()) {
+    wxMessageDialog dialog(this, "A batch is running. Stop it and quit?", kTitle, wxOK | wxCANCEL | wxICON_WARNING);
+    dialog.SetOKCancelLabels("&Stop and quit", "&Go on");
+    if (dialog.ShowModal() != wxID_OK) return event.Veto();
+  }
   if (FoldersShown()) settings.RememberNavPaneHPosition = ToDIP(splitter_->GetSashPosition());
   (void)SaveConfiguration();
+  FlushUses();
   event.Skip();
 }
 

@@ -5,6 +5,7 @@
 #include <string>
 #include <vector>
 
+#include "catalog/file_history.h"
 #include "desktop/windows/browser_page.h"
 #include "desktop/windows/thumbnail_service.h"
 
@@ -14,6 +15,7 @@ class wxSplitterWindow;
 
 namespace fotomill::desktop {
 
+class BatchRunner;
 class FolderTree;
 class ViewFrame;
 struct Command;
@@ -38,6 +40,15 @@ class MainFrame : public wxFrame, public BrowserHost {
   void ShowFolders(bool show);
   bool FoldersShown() const;
   ThumbnailService& Thumbnails() { return thumbnails_; }
+  BatchRunner& Batches() { return *batches_; }
+
+  // Selects the files that the browser in front shows.
+  void SelectFiles(const std::vector<std::string>& files);
+  // Files were written, renamed or deleted: browsers look again.
+  void FilesChanged();
+  // For the file history, which is written when nothing else is to be done.
+  void NoteUses(const std::vector<FileUse>& uses);
+  void FlushUses();
 
   // Opens a view window on a file, with the files of `list` as its neighbours.
   void ViewFiles(const std::vector<std::string>& list, const std::string& file);
@@ -69,6 +80,9 @@ class MainFrame : public wxFrame, public BrowserHost {
   wxAuiNotebook* tabs_ = nullptr;
   std::vector<std::string> closedTabs_;  // folders, the latest last
   std::string loggedState_;
+  std::vector<FileUse> uses_;
+  wxTimer usesTimer_;
+  std::unique_ptr<BatchRunner> batches_;
 };
 
 }  // namespace fotomill::desktop

@@ -216,7 +216,7 @@ void ViewFrame::TakePicture(ViewPicturePointer picture) {
   scaled_.reset();
   if (shown_->picture != nullptr) {
     transform_.SetPicture(shown_->picture->image.Width(), shown_->picture->image.Height());
-    RecordFileHistory(list_[place_], FileFunction::View);
+    frame_.NoteUses({FileUse{list_[place_], FileFunction::View}});
   }
   TransformChanged();
   if (slideTimer_.IsRunning()) slideTimer_.Start(kSlideMs);

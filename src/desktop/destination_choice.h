@@ -1,0 +1,40 @@
+#pragma once
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "batch/job.h"
+
+namespace fotomill::desktop {
+
+// The formats of the destination step, and what the user chose there last.
+struct DestinationFormat {
+  std::string extension;    // lower case, without dot
+  std::string description;  // "(PNG) Portable Network Graphics"
+  int32_t row = kNoFormat;  // of the registry; the spare row for plug-in formats
+};
+std::vector<DestinationFormat> DestinationFormats();
+
+// What the destination step asks for.
+struct DestinationChoice {
+  std::string extension;
+  std::string folder;  // empty: beside each source
+  bool reduce = true;  // colours of pictures that are too deep for the format
+  bool autoOrient = true;
+  bool keepMetadata = true;
+};
+
+// The folders to offer, the last used first; empty texts for "beside the source" are left out.
+std::vector<std::string> RecentDestinations();
+
+// What is wrong with a choice, a whole sentence; empty when nothing is.
+std::string DestinationProblem(const DestinationChoice& choice);
+
+// The path that the first file's output is going to have, before anyone looks whether it is free.
+std::string FirstDestination(const DestinationChoice& choice, const std::string& source);
+
+// A job that writes to the choice. The choice has no problem.
+BatchJob JobFor(const DestinationChoice& choice);
+
+}  // namespace fotomill::desktop

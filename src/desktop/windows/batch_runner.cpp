@@ -1,0 +1,161 @@
+#include "desktop/windows/batch_runner.h"
+
+#include <wx/msgdlg.h>
+#include <wx/textdlg.h>
+
+#include "batch/abort.h"
+#include "core/configuration.h"
+#include "desktop/destination_choice.h"
+#include "desktop/event_log.h"
+#include "desktop/windows/destination_dialog.h"
+#include "desktop/windows/main_frame.h"
+#include "desktop/windows/overwrite_dialog.h"
+#include "desktop/windows/progress_window.h"
+#include "desktop/windows/prompt_for_destination.h"
+#include "desktop/windows/wx_text.h"
+#include "platform/paths.h"
+
+namespace fotomill::desktop {
+
+BatchRunner::BatchRunner(MainFrame& frame) : frame_(frame) {
+  thread_ = std::make_unique<BatchThread>(
+      *this, [this](std::function<void()> action) { CallAfter([action = std::move(action)] { action(); }); });
+}
+
+BatchRunner::~BatchRunner() { thread_.reset(); }
+
+void BatchRunner::Run(std::vector<BatchFile> files, BatchFunction function, BatchJob job) {
+  Run(std::move(job), [files = std::move(files), function = std::move(function)](BatchJob& running) {
+    return RunBatch(files, function, running);
+  });
+}
+
+void BatchRunner::Run(BatchJob job, BatchThread::Work work) {
+  waiting_.push_back({std::move(job), std::move(work)});
+  if (!Running()) {
+    StartNext();
+  } else {
+    frame_.Tell("The batch begins when the one before has ended.");
+  }
+}
+
+void BatchRunner::StartNext() {
+  if (waiting_.empty()) return;
+  CloseBox();
+  Waiting next = std::move(waiting_.front());
+  waiting_.pop_front();
+  thread_->StartWork(std::move(next.job), std::move(next.work));
+}
+
+void BatchRunner::CloseBox() {
+  if (box_ != nullptr) std::exchange(box_, nullptr)->Destroy();
+}
+
+wxWindow* BatchRunner::DialogParent() const { return box_ != nullptr ? static_cast<wxWindow*>(box_) : &frame_; }
+
+// --- the progress box ---
+
+void BatchRunner::BatchOpened() {
+  ProgressWindow::Events events;
+  events.abort = [] { Abort(); };
+  events.closed = [this] { CallAfter([this] { CloseBox(); }); };
+  events.selectFailed = [this](const std::vector<std::string>& files) { frame_.SelectFiles(files); };
+  CloseBox();
+  box_ = new ProgressWindow(&frame_, frame_.Thumbnails(), events);
+  box_->Show();
+  LogEvent("batch", "opened");
+}
+
+void BatchRunner::BatchLine(const ProgressLine& line, const std::string& source) {
+  LogEvent("batch-line", line.text);
+  if (box_ != nullptr) box_->AddLine(line, source);
+}
+
+void BatchRunner::BatchStatus(const std::string& status) {
+  if (box_ != nullptr) box_->SetStatus(status);
+}
+
+void BatchRunner::BatchProgress(uint32_t done, uint32_t count) {
+  if (box_ != nullptr) box_->SetProgress(done, count);
+}
+
+void BatchRunner::BatchStaysOpen(const ProgressModel& model) {
+  LogEvent("batch", "stays-open files=" + std::to_string(model.Files()));
+  if (box_ != nullptr) box_->StayOpen();
+}
+
+void BatchRunner::BatchCloses() {
+  LogEvent("batch", "closes");
+  CloseBox();
+}
+
+void BatchRunner::BatchEnded(Status status, const BatchJob& job) {
+  LogEvent("batch", "ended status=" + std::to_string(StatusNumber(status)));
+  frame_.NoteUses(job.uses);
+  if (job.filesChanged) frame_.FilesChanged();
+  if (!frame_.IsActive() && (box_ == nullptr || !box_->IsActive())) frame_.RequestUserAttention(wxUSER_ATTENTION_INFO);
+  if (status == Status::Ok) frame_.Tell(CountLine(job.progress.Files()));
+  CallAfter([this] { StartNext(); });
+}
+
+// --- questions ---
+
+OverwriteAnswer BatchRunner::AskOverwrite(const OverwriteQuestion& question, const OverwritePreview& preview) {
+  OverwriteDialog dialog(DialogParent(), question, preview);
+  LogEvent("prompt", "overwrite " + question.path);
+  dialog.ShowModal();
+  return dialog.Answer();
+}
+
+std::optional<std::string> BatchRunner::AskDestinationName(const NameQuestion& question) {
+  const wxString problem = question.problem.empty() ? wxString() : Shown(question.problem) + "\n";
+  wxTextEntryDialog dialog(DialogParent(), problem + "Write " + Shown(platform::FileNameOf(question.source)) + " to:",
+                           question.title.empty() ? wxString("Destination name") : Shown(question.title),
+                           wxString::FromUTF8(question.path));
+  LogEvent("prompt", "name " + question.path);
+  if (dialog.ShowModal() != wxID_OK) return std::nullopt;
+  return Utf8(dialog.GetValue());
+}
+
+std::optional<std::string> BatchRunner::AskPassword(const std::string& path) {
+  wxPasswordEntryDialog dialog(DialogParent(), "Password for " + Shown(platform::FileNameOf(path)) + ":", "Password");
+  LogEvent("prompt", "password " + path);
+  if (dialog.ShowModal() != wxID_OK) return std::nullopt;
+  return Utf8(dialog.GetValue());
+}
+
+bool BatchRunner::ConfirmFormat(const std::string& question) {
+  LogEvent("prompt", "format " + question);
+  return PromptForDestination(*DialogParent(), question);
+}
+
+bool BatchRunner::Confirm(const std::string& question, const std::string& yes) {
+  wxMessageDialog dialog(DialogParent(), Shown(question), "Fotomill Professional", wxOK | wxCANCEL | wxICON_QUESTION);
+  dialog.SetOKLabel(Shown(yes));
+  LogEvent("prompt", "confirm " + question);
+  return dialog.ShowModal() == wxID_OK;
+}
+
+void BatchRunner::StoreFlag(KeyNumber key, bool value) {
+  SettingValue flag;
+  flag.number = value ? 1 : 0;
+  if (StoreSetting(KeyOf(key), flag) != SaveResult::Done) StoreNumber(KeyOf(key), flag.number);
+}
+
+void ConvertSelection(MainFrame& frame) {
+  const std::vector<std::string> files = frame.SelectedFiles();
+  if (files.empty()) return;
+  DestinationDialog dialog(&frame, "Convert", files);
+  LogEvent("prompt", "destination");
+  if (dialog.ShowModal() != wxID_OK) return;
+  const DestinationChoice choice = dialog.Choice();
+  std::vector<BatchFile> batch;
+  for (const std::string& file : files) batch.push_back({.name = file, .below = {}, .hint = {}});
+  BatchFunction function;
+  function.reduce = choice.reduce;
+  function.autoOrient = choice.autoOrient;
+  function.keepMetadata = choice.keepMetadata;
+  frame.Batches().Run(std::move(batch), std::move(function), JobFor(choice));
+}
+
+}  // namespace fotomill::desktop

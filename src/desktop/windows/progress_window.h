@@ -1,0 +1,69 @@
+#pragma once
+
+#include <wx/frame.h>
+#include <wx/gauge.h>
+
+#include <functional>
+#include <string>
+#include <vector>
+
+#include "batch/progress_model.h"
+#include "desktop/windows/thumbnail_service.h"
+
+class wxButton;
+class wxStaticText;
+class wxVListBox;
+
+namespace fotomill::desktop {
+
+// The progress box: lists files as they are processed, with Abort while the batch runs and Close after it. Not modal.
+class ProgressWindow : public wxFrame {
+ public:
+  struct Events {
+    std::function<void()> abort;
+    std::function<void()> closed;
+    std::function<void(const std::vector<std::string>& files)> selectFailed;  // shows the failed files in their browser
+  };
+  ProgressWindow(wxWindow* frame, ThumbnailService& thumbnails, Events events);
+
+  void AddLine(const ProgressLine& line, const std::string& source);
+  void SetStatus(const std::string& status);
+  void SetProgress(uint32_t done, uint32_t count);
+  // The batch has ended and the box stays: closing lines are there, Close is live.
+  void StayOpen();
+
+ private:
+  class DrawnList;
+  class PlainList;
+  struct Row {
+    ProgressLine line;
+    std::string source;
+  };
+  wxWindow* MakeList(bool scrollBar);
+  void LayOut();
+  void RowAdded();
+  void CopyList();
+  std::vector<std::string> FailedFiles() const;
+  int FirstVisible() const;
+  void ShowFrom(int row, int selected);
+
+  const Events events_;
+  ThumbnailService& thumbnails_;
+  const ProgressSettings settings_;
+  std::vector<Row> rows_;
+  double started_ = 0;
+  bool done_ = false;
+  std::string text_;  // of the status line, without the time left
+  wxWindow* panel_ = nullptr;
+  wxWindow* list_ = nullptr;
+  DrawnList* drawn_ = nullptr;  // the list, when the box draws it
+  PlainList* plain_ = nullptr;  // the list, when it is one of texts
+  wxStaticText* status_ = nullptr;
+  wxGauge* bar_ = nullptr;
+  wxButton* abort_ = nullptr;
+  wxButton* close_ = nullptr;
+  wxButton* copy_ = nullptr;    // what the errors leave to do; hidden until there are some
+  wxButton* select_ = nullptr;
+};
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,86 @@
+#!/usr/bin/env python3
+"""Batches of the real program: converting, collisions, errors that keep the box open, abort."""
+from driven_desktop import Desktop, Failure, make_pictures, run
+
+
+def start_convert(desktop):
+    """Convert with the settings of the dialog as it opens."""
+    desktop.focus("Fotomill Professional")
+    desktop.key("ctrl+a", "ctrl+e")
+    desktop.wait(r"prompt destination")
+    desktop.focus("^Convert$")
+    desktop.screenshot("destination")
+
+
+def confirm(desktop):
+    desktop.key("Return")
+    desktop.wait(r"prompt format Write files to the \w+ format")
+    desktop.focus("^Destination$")
+    desktop.key("Return")
+
+
+def convert_and_collide(folder):
+    pictures, out = folder / "pictures", folder / "out"
+    make_pictures(pictures, ["one.bmp", "two.bmp"])
+    out.mkdir()
+    (out / "one.png").write_bytes(b"old")
+    (folder / "data").mkdir()
+    (folder / "data/FMWDestinationHistory.txt").write_text(f"{out}\n")
+    with Desktop(folder, pictures, settings=["CloseProgressWhenDone=0", "OverwriteKeepBoth=0"]) as desktop:
+        desktop.wait(r"lines=2 .*missing=0 listing=0")
+        start_convert(desktop)
+        confirm(desktop)
+        # The overwrite prompt: Escape skips and leaves the file alone.
+        desktop.wait(r"prompt overwrite .*one.png")
+        desktop.focus("^Overwrite File$")
+        desktop.screenshot("overwrite")
+        desktop.key("Escape")
+        desktop.wait(r"batch-line .*one.bmp.*skipped")
+        desktop.wait(r"batch-line .*two.bmp -> .*two.png")
+        desktop.wait(r"batch-line One file was processed|batch-line 2 files were processed")
+        desktop.wait(r"batch stays-open")
+        desktop.focus("^Progress$")
+        desktop.screenshot("progress")
+        desktop.key("Escape")
+        assert (out / "one.png").read_bytes() == b"old"
+        assert (out / "two.png").read_bytes()[:4] == b"\x89PNG"
+        # Typed over with another name, both stay.
+        start_convert(desktop)
+        confirm(desktop)
+        desktop.wait(r"prompt overwrite .*one.png")
+        desktop.focus("^Overwrite File$")
+        desktop.key("ctrl+a")
+        desktop.type("three")
+        desktop.key("Return")
+        desktop.wait(r"prompt overwrite .*two.png")
+        desktop.focus("^Overwrite File$")
+        desktop.key("Return")
+        desktop.wait(r"batch ended status=0")
+        assert (out / "one.png").read_bytes() == b"old"
+        assert sorted(path.name for path in out.iterdir()) == ["one.png", "three.png", "two.png"]
+
+
+def errors_stay_and_abort_stops(folder):
+    pictures = folder / "pictures"
+    make_pictures(pictures, [f"p{number}.bmp" for number in range(400)])
+    (pictures / "a.gif").write_bytes(b"GIF89a and no more")
+    with Desktop(folder, pictures, settings=["DestForceSourceDir=1", "DefaultFileExtension=tif"]) as desktop:
+        desktop.wait(r"lines=401 .*listing=0")
+        start_convert(desktop)
+        confirm(desktop)
+        desktop.wait(r"batch-line .*a.gif: ")
+        desktop.focus("^Progress$")
+        desktop.key("alt+a")
+        desktop.wait(r"batch-line There were errors")
+        line = desktop.wait(r"batch-line \d+ files were processed")
+        assert int(line.split()[1]) < 401, line
+        desktop.wait(r"batch stays-open")
+        desktop.wait(r"batch ended")
+        written = [path for path in pictures.iterdir() if path.suffix == ".tif"]
+        for path in written:
+            if path.read_bytes()[:2] not in (b"II", b"MM") or path.stat().st_size < 1000:
+                raise Failure(f"{path.name} is not whole")
+        desktop.screenshot("errors")
+
+
+run(convert_and_collide, errors_stay_and_abort_stops)
