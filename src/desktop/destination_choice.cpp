@@ -58,7 +58,7 @@ BatchJob JobFor(const DestinationChoice& choice) {
   BatchJob job;
   job.formatIndex = RowOf(choice.extension);
   job.extension = UpperCase(choice.extension);
-  job.destinationFolder.AssignCut(choice.folder);
+  job.destinationFolder = choice.folder;
   return job;
 }
 

@@ -47,6 +47,9 @@ std::optional<std::vector<FolderEntry>> ListFolder(const std::string& path);
 // Moves a file, folder or link into the system's trash, from which its user can bring it back. False when there is none
 // for it; nothing has happened then.
 [[nodiscard]] bool MoveToTrash(const std::string& path);
+// Brings back what MoveToTrash took away from that path last. False when it is not in the trash any more, or when the path
+// is taken.
+[[nodiscard]] bool RestoreFromTrash(const std::string& path);
 // Whether MoveToTrash can work for that path, without doing it.
 bool HasTrash(const std::string& path);
 

@@ -69,6 +69,24 @@ TEST_F(TrashTest, KeepsWhatHasTheSameName) {
   EXPECT_FALSE(FileExists(Trash("info/left.trashinfo")));
 }
 
+TEST_F(TrashTest, BringsBackWhatWasDeletedLast) {
+  for (const char* text : {"older", "newer"}) {
+    WriteText(Picture("a%.bmp"), text);
+    ASSERT_TRUE(MoveToTrash(Picture("a%.bmp")));
+    FixNow(Now() + 1);
+  }
+  EXPECT_FALSE(RestoreFromTrash(Picture("b.bmp")));
+  WriteText(Picture("a%.bmp"), "in the way");
+  EXPECT_FALSE(RestoreFromTrash(Picture("a%.bmp")));
+  EXPECT_EQ(ReadText(Picture("a%.bmp")), "in the way");
+  for (const char* text : {"newer", "older"}) {
+    fs::remove(Picture("a%.bmp"));
+    ASSERT_TRUE(RestoreFromTrash(Picture("a%.bmp")));
+    EXPECT_EQ(ReadText(Picture("a%.bmp")), text);
+  }
+  EXPECT_THAT(NamesIn(Trash("info")), IsEmpty());
+}
+
 TEST_F(TrashTest, TakesFoldersLinksAndLongNames) {
   fs::create_directories(Picture("folder/inner"));
   fs::create_symlink("folder", Picture("link"));

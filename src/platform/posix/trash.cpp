@@ -214,6 +214,29 @@ bool MoveTo(const Place& place, const Victim& victim) {
   return false;
 }
 
+// The name in a trash folder of what was deleted from the remembered path last; empty when there is nothing of it.
+std::string FindInTrash(const Place& place, const std::string& ownName) {
+  constexpr std::string_view kInfo = ".trashinfo";
+  constexpr uint64_t kLongestInfo = 64 * 1024;
+  const std::string info = JoinFolder(place.folder, "info");
+  const std::string begin(SplitPath(ownName).base.substr(0, kLongestBase));
+  const std::string wanted = "\nPath=" + PercentEncoded(place.remembered) + "\n";
+  std::string found, foundDate;
+  for (const FolderEntry& entry : ListFolder(info).value_or(std::vector<FolderEntry>())) {
+    std::string text;
+    if (!entry.name.starts_with(begin) || !entry.name.ends_with(kInfo)) continue;
+    if (ReadWholeFile(JoinFolder(info, entry.name), kLongestInfo, text) != ReadResult::Done) continue;
+    const size_t date = text.find("\nDeletionDate=");
+    if (text.find(wanted) == std::string::npos || date == std::string::npos) continue;
+    const std::string name = entry.name.substr(0, entry.name.size() - kInfo.size());
+    if (!FileExists(JoinFolder(JoinFolder(place.folder, "files"), name))) continue;
+    if (!found.empty() && text.compare(date, std::string::npos, foundDate) < 0) continue;
+    found = name;
+    foundDate = text.substr(date);
+  }
+  return found;
+}
+
 bool MayWriteTo(const std::string& folder) { return access(folder.c_str(), W_OK | X_OK) == 0; }
 
 }  // namespace
@@ -223,6 +246,24 @@ bool MoveToTrash(const std::string& path) {
   if (!FindVictim(path, victim)) return false;
   for (const Place& place : PlacesFor(victim)) {
     if (MoveTo(place, victim)) return true;
+  }
+  return false;
+}
+
+bool RestoreFromTrash(const std::string& path) {
+  Victim victim;
+  struct stat facts;
+  victim.name = FileNameOf(path);
+  victim.folder = RealPath(std::string(SplitPath(path).folder));
+  if (victim.name.empty() || victim.folder.empty() || stat(victim.folder.c_str(), &facts) != 0) return false;
+  victim.device = facts.st_dev;
+  for (const Place& place : PlacesFor(victim)) {
+    const std::string name = FindInTrash(place, victim.name);
+    if (name.empty()) continue;
+    if (FaultDue()) return false;
+    if (RenameRefusing(JoinFolder(JoinFolder(place.folder, "files"), name), victim.Path()) != CommitResult::Done) return false;
+    unlink(JoinFolder(JoinFolder(place.folder, "info"), name + ".trashinfo").c_str());
+    return true;
   }
   return false;
 }
