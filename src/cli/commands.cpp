@@ -10,6 +10,7 @@
 #include "cli/info.h"
 #include "cli/match.h"
 #include "cli/plugins.h"
+#include "cli/rename.h"
 #include "cli/tdb.h"
 #include "cli/thumbs.h"
 #include "cli/verify.h"
@@ -21,6 +22,7 @@ namespace {
 // clang-format off
 constexpr Command kCommands[] = {
     {"convert", "convert pictures to another format",                          Needs::Formats,  SetUpConvert},
+    {"rename",  "number files, each under a base name or with its own",        Needs::Formats,  SetUpRename},
     {"info",    "tell what files hold, without decoding them",                 Needs::Formats,  SetUpInfo},
     {"formats", "list the formats and what this build can do with them",       Needs::Formats,  SetUpFormats},
     {"match",   "tell which format a file name selects, without opening it",   Needs::Formats,  SetUpMatch},

@@ -1,0 +1,220 @@
+#include "batch/sequential_rename.h"
+
+#include <algorithm>
+#include <numeric>
+#include <random>
+
+#include "batch/abort.h"
+#include "batch/rename_log.h"
+#include "core/configuration.h"
+#include "core/plain_name.h"
+#include "core/settings.h"
+#include "platform/clock.h"
+#include "platform/folders.h"
+#include "platform/paths.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr double kStoreInterval = 1;  // seconds between two writes of the next number
+constexpr const char* kNotSafe = "It could not be noted for --undo.";
+
+// The next number as the setting can hold it.
+int32_t SettingOf(uint32_t number) { return static_cast<int32_t>(std::min<uint32_t>(number, INT32_MAX)); }
+
+// Keeps the number that the next run begins with.
+class NextNumber {
+ public:
+  NextNumber(const RenameOptions& options, bool update) : options_(options), on_(update && !options.dryRun) {}
+  ~NextNumber() { Store(); }
+  NextNumber(const NextNumber&) = delete;
+  NextNumber& operator=(const NextNumber&) = delete;
+
+  void Set(uint32_t number) {
+    number_ = number;
+    set_ = on_;
+    if (platform::MonotonicSeconds() - stored_ > kStoreInterval) Store();
+  }
+
+ private:
+  void Store() {
+    if (!set_) return;
+    set_ = false;
+    stored_ = platform::MonotonicSeconds();
+    if (options_.storeNumber) return options_.storeNumber(number_);
+    const KeyRow& key = KeyOf(KeyNumber::SequentialRenameBaseNumber);
+    SettingValue value;
+    value.number = SettingOf(number_);
+    if (StoreSetting(key, value) != SaveResult::Done) StoreNumber(key, value.number);  // it holds for this run at least
+  }
+
+  const RenameOptions& options_;
+  const bool on_;
+  bool set_ = false;
+  uint32_t number_ = 0;
+  double stored_ = platform::MonotonicSeconds();
+};
+
+std::string NewBaseName(const BatchJob& job, const SequentialRenameRules& rules, std::string_view oldBase) {
+  const std::string number = NumberText(job.rename.number, job.rename.digits);
+  if (rules.numberFirst) return number + rules.separator + std::string(oldBase);
+  return std::string(job.rename.baseName.view()) + rules.separator + number;
+}
+
+std::string RenameHint(const std::string& path, const BatchJob& job) {
+  if (!IsPlainName(job.rename.baseName.view())) return "The base name is a part of a name and cannot lead to a folder.";
+  if (path.size() > PathText::Capacity()) return "Its path would be longer than 260 characters.";
+  return {};
+}
+
+FileUse Use(const std::string& path, bool removed) {
+  return {platform::AbsolutePath(path), FileFunction::MoveAndCopy, kOwnTime, static_cast<int32_t>(platform::Now()), removed};
+}
+
+FileOutcome RenameOne(const BatchFile& file, const SequentialRenameRules& rules, RenamedFiles& files, BatchJob& job,
+                      RenameLog* log) {
+  FileOutcome outcome{.source = file.name, .status = file.status, .hint = file.hint};
+  if (outcome.status == Status::Ok && (!files.Exists(file.name) || !platform::IsRegularFile(file.name))) {
+    outcome.status = Status::FileOpenError;
+  }
+  if (outcome.status != Status::Ok) return outcome;
+  outcome.destination = file.name;
+  outcome.status = RenameSequentially(job, outcome.destination, rules, files);
+  if (outcome.status != Status::Ok) {
+    outcome.hint = RenameHint(outcome.destination, job);
+  } else if (outcome.destination == file.name) {
+    outcome.skipped = true;
+    outcome.hint = "skipped, its new name is taken.";
+  } else if (log != nullptr) {
+    const bool noted = log->Add({platform::AbsolutePath(file.name), platform::AbsolutePath(outcome.destination)});
+    if (!noted) outcome.note = kNotSafe;
+  }
+  return outcome;
+}
+
+}  // namespace
+
+SequentialRenameRules SequentialRenameRulesFromSettings() {
+  return {.increment = static_cast<uint32_t>(std::max(settings.SequentialRenameIncrement, 1)),
+          .maxAttempts = static_cast<uint32_t>(std::max(settings.SequentialRenameMaxAttempts, 1)),
+          .separator = settings.SequentialRenameHyphen != 0 ? std::string(settings.SequentialRenameSep) : std::string(),
+          .numberFirst = settings.SequentialRenamePrefix != 0,
+          .skipColliding = settings.SequentialRenameSkipCollide != 0,
+          .update = settings.SequentialRenameUpdate != 0,
+          .random = settings.SequentialRenameRandom != 0};
+}
+
+bool RenamedFiles::Exists(const std::string& path) const {
+  if (there_.contains(path)) return true;
+  return !gone_.contains(path) && platform::FileExists(path);
+}
+
+platform::CommitResult RenamedFiles::Rename(const std::string& from, const std::string& to) {
+  if (!dryRun_) return platform::RenameFile(from, to, platform::Existing::Refuse);
+  there_.erase(from);
+  gone_.insert(from);
+  gone_.erase(to);
+  there_.insert(to);
+  return platform::CommitResult::Done;
+}
+
+std::string NumberText(uint32_t number, int32_t digits) {
+  const std::string text = std::to_string(number);
+  const auto width = static_cast<size_t>(std::max(digits, 0));
+  return text.size() < width ? std::string(width - text.size(), '0') + text : text;
+}
+
+Status RenameSequentially(BatchJob& job, std::string& path, const SequentialRenameRules& rules, RenamedFiles& files) {
+  const std::string old = path;
+  const platform::PathParts parts = platform::SplitPath(old);
+  for (uint32_t attempt = 1; attempt < rules.maxAttempts; ++attempt) {
+    path = platform::JoinPath({parts.drive, parts.folder, NewBaseName(job, rules, parts.base), parts.extension});
+    if (!RenameHint(path, job).empty()) return Status::RenameError;
+    const bool free = path != old && !files.Exists(path);
+    const platform::CommitResult result = free ? files.Rename(old, path) : platform::CommitResult::Taken;
+    if (UINT32_MAX - job.rename.number < rules.increment && result != platform::CommitResult::Done) return Status::RenameError;
+    job.rename.number += rules.increment;
+    if (result == platform::CommitResult::Done) {
+      job.uses.push_back(Use(old, true));
+      job.uses.push_back(Use(path, false));
+      job.filesChanged = true;
+      return Status::Ok;
+    }
+    if (result == platform::CommitResult::Failed) return Status::RenameError;  // no other number would do better
+    if (rules.skipColliding) {
+      path = old;
+      return Status::Ok;
+    }
+  }
+  return Status::RenameError;
+}
+
+// Fisher and Yates with the numbers of Mersenne Twister, which the language fixes.
+std::vector<size_t> RandomOrder(size_t count, uint64_t seed) {
+  std::vector<size_t> order(count);
+  std::iota(order.begin(), order.end(), size_t{0});
+  std::mt19937_64 numbers(seed);
+  for (size_t i = count; i > 1; --i) std::swap(order[i - 1], order[numbers() % i]);
+  return order;
+}
+
+void RunRename(std::span<const BatchFile> files, const RenameOptions& options, BatchJob& job) {
+  if (!OpenProgressBox(job)) return;
+  const SequentialRenameRules rules = SequentialRenameRulesFromSettings();
+  std::vector<size_t> order(files.size());
+  std::iota(order.begin(), order.end(), size_t{0});
+  if (rules.random) order = RandomOrder(files.size(), options.seed ? *options.seed : std::random_device()());
+  RenamedFiles renamed(options.dryRun);
+  RenameLog log;
+  NextNumber next(options, rules.update);
+  uint32_t done = 0;
+  for (const size_t place : order) {
+    if (AbortAsked() || (job.box != nullptr && !job.box->GoesOn())) break;
+    job.source.AssignCut(files[place].name);
+    const uint32_t before = job.rename.number;
+    const FileOutcome outcome = RenameOne(files[place], rules, renamed, job, options.dryRun ? nullptr : &log);
+    if (job.rename.number != before) next.Set(job.rename.number);
+    ReportOutcome(job, outcome, done++, static_cast<uint32_t>(files.size()));
+  }
+  if (options.dryRun) job.uses.clear();
+  FinishProgress(job);
+}
+
+bool UndoRename(const std::set<std::string>& only, bool dryRun, BatchJob& job) {
+  const auto log = ReadRenameLog();
+  if (!log) return false;
+  std::vector<RenamedFile> wanted, left;
+  for (const RenamedFile& file : *log) (only.empty() || only.contains(file.to) ? wanted : left).push_back(file);
+  if (!OpenProgressBox(job)) return true;
+  RenamedFiles files(dryRun);
+  uint32_t done = 0;
+  const auto count = static_cast<uint32_t>(wanted.size());
+  for (; !wanted.empty() && !AbortAsked(); wanted.pop_back()) {
+    const RenamedFile& file = wanted.back();
+    FileOutcome outcome{.source = file.to, .destination = file.from};
+    if (!files.Exists(file.to)) {
+      outcome.status = Status::FileOpenError;
+      outcome.hint = "There is no such file.";
+    } else if (files.Exists(file.from) || files.Rename(file.to, file.from) != platform::CommitResult::Done) {
+      outcome.status = Status::RenameError;
+      outcome.hint = files.Exists(file.from) ? "\"" + file.from + "\" exists." : "";
+    } else {
+      job.uses.push_back(Use(file.to, true));
+      job.uses.push_back(Use(file.from, false));
+      job.filesChanged = true;
+    }
+    if (outcome.status != Status::Ok) left.push_back(file);
+    ReportOutcome(job, outcome, done++, count);
+  }
+  left.insert(left.end(), wanted.begin(), wanted.end());
+  if (dryRun) {
+    job.uses.clear();
+  } else if (!log->empty() && !WriteRenameLog(left)) {
+    job.errors = true;
+  }
+  FinishProgress(job);
+  return true;
+}
+
+}  // namespace fotomill

@@ -1,0 +1,67 @@
+#pragma once
+
+#include <cstdint>
+#include <functional>
+#include <optional>
+#include <set>
+#include <span>
+#include <string>
+#include <vector>
+
+#include "batch/job.h"
+#include "batch/run.h"
+#include "platform/files.h"
+
+namespace fotomill {
+
+// How files are numbered: the SequentialRename... keys.
+struct SequentialRenameRules {
+  uint32_t increment = 1;      // at least 1
+  uint32_t maxAttempts = 32760;
+  std::string separator;       // between name and number; empty: none
+  bool numberFirst = false;    // the number, then the file's own old name
+  bool skipColliding = false;
+  bool update = true;          // the next number goes into SequentialRenameBaseNumber
+  bool random = false;
+};
+SequentialRenameRules SequentialRenameRulesFromSettings();
+
+// The files that are renamed. In a dry run they only seem to be.
+class RenamedFiles {
+ public:
+  explicit RenamedFiles(bool dryRun) : dryRun_(dryRun) {}
+  bool Exists(const std::string& path) const;
+  platform::CommitResult Rename(const std::string& from, const std::string& to);
+
+ private:
+  const bool dryRun_;
+  std::set<std::string> gone_, there_;
+};
+
+// The number as names hold it: `digits` wide, zero-filled.
+std::string NumberText(uint32_t number, int32_t digits);
+
+// Gives `path` the next free number and stores the new path in it. Ok when the file was renamed or, the new name being
+// taken, left as it was; RenameError when no number was free within the attempts, or when the system does not rename it.
+// A rename sets the job's files-changed flag and goes to job.uses.
+Status RenameSequentially(BatchJob& job, std::string& path, const SequentialRenameRules& rules, RenamedFiles& files);
+
+// The order of a random run: places 0 to count - 1, the same for the same seed everywhere.
+std::vector<size_t> RandomOrder(size_t count, uint64_t seed);
+
+struct RenameOptions {
+  std::optional<uint64_t> seed = {};  // of the random order; none: another one each time
+  bool dryRun = false;
+  // Keeps the next number for good; called a few times a second at most and at the end. None: StoreSetting does, on the
+  // calling thread.
+  std::function<void(uint32_t next)> storeNumber = {};
+};
+
+// Renames a selection: opens the job's progress box, reports every file, finishes the box. What was renamed can be taken back
+// by UndoRename until the next run.
+void RunRename(std::span<const BatchFile> files, const RenameOptions& options, BatchJob& job);
+// Gives the files of the last run their old names again, the last one first; with `only`, absolute paths, those of them
+// only. What cannot be taken back can be tried again. Unreadable: false, nothing was done.
+bool UndoRename(const std::set<std::string>& only, bool dryRun, BatchJob& job);
+
+}  // namespace fotomill

@@ -1,0 +1,135 @@
+#include "batch/sequential_rename.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <filesystem>
+
+#include "batch/rename_log.h"
+#include "core/data_folder.h"
+#include "core/settings.h"
+#include "support/files.h"
+#include "support/scoped_settings.h"
+
+namespace fotomill::test {
+namespace {
+
+using testing::ElementsAre;
+
+class Rename : public testing::Test {
+ protected:
+  Rename() {
+    SetDataFolder(folder_.Path("data"));
+    std::filesystem::create_directory(folder_.Path("p"));
+  }
+  ~Rename() override { SetDataFolder({}); }
+
+  void Make(const std::vector<std::string>& names) const {
+    std::filesystem::remove_all(folder_.Path("p"));
+    std::filesystem::create_directory(folder_.Path("p"));
+    for (const std::string& name : names) WriteText(folder_.Path("p/" + name), name);
+  }
+  // Each file of the folder as "NAME=CONTENTS"; the contents are its first name.
+  std::vector<std::string> There() const {
+    std::vector<std::string> files;
+    for (const auto& entry : std::filesystem::directory_iterator(folder_.Path("p"))) {
+      files.push_back(entry.path().filename().string() + "=" + ReadText(entry.path()));
+    }
+    std::sort(files.begin(), files.end());
+    return files;
+  }
+  BatchJob RunOn(const std::vector<std::string>& names, const RenameOptions& options = {}) const {
+    std::vector<BatchFile> files;
+    for (const std::string& name : names) files.push_back({folder_.Path("p/" + name), {}, Status::Ok, {}});
+    BatchJob job;
+    job.rename = SequentialRenameFromSettings();
+    RunRename(files, options, job);
+    return job;
+  }
+
+  TemporaryFolder folder_;
+  const ScopedSettings keep_;
+};
+
+TEST_F(Rename, Names) {
+  const struct {
+    const char* name;
+    std::vector<std::string> there, renamed;  // the first of them are renamed
+    int32_t number, increment, attempts;
+    bool hyphen, prefix, skip;
+    std::vector<std::string> after;
+    int32_t next;
+    bool errors = false;
+  } rows[] = {
+      {"plain", {"a.jpg", "b.PNG", "c"}, {"a.jpg", "b.PNG", "c"}, 1, 1, 32760, false, false, false,
+       {"PICTURE0001.jpg=a.jpg", "PICTURE0002.PNG=b.PNG", "PICTURE0003=c"}, 4},
+      {"hyphen", {"a.jpg"}, {"a.jpg"}, 12345, 5, 32760, true, false, false, {"PICTURE-12345.jpg=a.jpg"}, 12350},
+      {"number in front", {"beach.jpg"}, {"beach.jpg"}, 1, 0, 32760, true, true, false, {"0001-beach.jpg=beach.jpg"}, 2},
+      {"taken ones are passed over", {"PICTURE0001.jpg", "PICTURE0003.jpg", "a.jpg", "b.jpg"}, {"a.jpg", "b.jpg"}, 1, 1, 32760,
+       false, false, false,
+       {"PICTURE0001.jpg=PICTURE0001.jpg", "PICTURE0002.jpg=a.jpg", "PICTURE0003.jpg=PICTURE0003.jpg", "PICTURE0004.jpg=b.jpg"}, 5},
+      {"colliding ones are left", {"PICTURE0001.jpg", "a.jpg", "b.jpg"}, {"a.jpg", "b.jpg"}, 1, 1, 32760, false, false, true,
+       {"PICTURE0001.jpg=PICTURE0001.jpg", "PICTURE0002.jpg=b.jpg", "a.jpg=a.jpg"}, 3},
+      {"its own name is taken too", {"PICTURE0001.jpg"}, {"PICTURE0001.jpg"}, 1, 1, 32760, false, false, false,
+       {"PICTURE0002.jpg=PICTURE0001.jpg"}, 3},
+      // The counter is raised before it is compared: with 3 there are two tries.
+      {"attempts", {"PICTURE0001.jpg", "PICTURE0002.jpg", "a.jpg"}, {"a.jpg"}, 1, 1, 3, false, false, false,
+       {"PICTURE0001.jpg=PICTURE0001.jpg", "PICTURE0002.jpg=PICTURE0002.jpg", "a.jpg=a.jpg"}, 3, true},
+      {"attempts below 1", {"a.jpg"}, {"a.jpg"}, 1, 1, -7, false, false, false, {"a.jpg=a.jpg"}, 1, true},
+      {"gone", {"a.jpg"}, {"none.jpg", "a.jpg"}, 1, 1, 32760, false, false, false, {"PICTURE0001.jpg=a.jpg"}, 2, true},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    Make(row.there);
+    settings.SequentialRenameBaseNumber = row.number;
+    settings.SequentialRenameIncrement = row.increment;
+    settings.SequentialRenameMaxAttempts = row.attempts;
+    settings.SequentialRenameHyphen = row.hyphen;
+    settings.SequentialRenamePrefix = row.prefix;
+    settings.SequentialRenameSkipCollide = row.skip;
+    const BatchJob dry = RunOn(row.renamed, {.dryRun = true});
+    EXPECT_EQ(There().size(), row.there.size());
+    EXPECT_EQ(settings.SequentialRenameBaseNumber, row.number);
+    const BatchJob job = RunOn(row.renamed);
+    EXPECT_EQ(There(), row.after);
+    EXPECT_EQ(settings.SequentialRenameBaseNumber, row.next);
+    EXPECT_EQ(job.errors, row.errors);
+    for (size_t i = 0; i < job.progress.Lines().size(); ++i) EXPECT_EQ(job.progress.Lines()[i].text, dry.progress.Lines()[i].text);
+  }
+}
+
+TEST_F(Rename, TakenBack) {
+  Make({"a.jpg", "b.jpg", "c.jpg"});
+  const BatchJob job = RunOn({"a.jpg", "b.jpg", "c.jpg"});
+  ASSERT_EQ(job.uses.size(), 6u);
+  EXPECT_EQ(job.uses[0].path, folder_.Path("p/a.jpg"));
+  EXPECT_TRUE(job.uses[0].removed && !job.uses[1].removed && job.uses[1].function == FileFunction::MoveAndCopy);
+  WriteText(folder_.Path("p/b.jpg"), "new");
+  BatchJob undo;
+  ASSERT_TRUE(UndoRename({folder_.Path("p/PICTURE0003.jpg")}, false, undo));
+  EXPECT_THAT(There(), ElementsAre("PICTURE0001.jpg=a.jpg", "PICTURE0002.jpg=b.jpg", "b.jpg=new", "c.jpg=c.jpg"));
+  ASSERT_TRUE(UndoRename({}, false, undo));
+  EXPECT_TRUE(undo.errors);
+  EXPECT_THAT(There(), ElementsAre("PICTURE0002.jpg=b.jpg", "a.jpg=a.jpg", "b.jpg=new", "c.jpg=c.jpg"));
+  std::filesystem::remove(folder_.Path("p/b.jpg"));
+  ASSERT_TRUE(UndoRename({}, false, undo));  // what could not be taken back is still known
+  EXPECT_FALSE(undo.errors);
+  EXPECT_THAT(There(), ElementsAre("a.jpg=a.jpg", "b.jpg=b.jpg", "c.jpg=c.jpg"));
+  EXPECT_TRUE(ReadRenameLog()->empty());
+}
+
+TEST_F(Rename, RandomOrderIsThatOfItsSeed) {
+  EXPECT_THAT(RandomOrder(8, 1), testing::UnorderedElementsAre(0, 1, 2, 3, 4, 5, 6, 7));
+  EXPECT_EQ(RandomOrder(100, 5), RandomOrder(100, 5));
+  EXPECT_NE(RandomOrder(100, 5), RandomOrder(100, 6));
+  Make({"a", "b", "c", "d"});
+  settings.SequentialRenameRandom = 1;
+  std::vector<std::string> expected;
+  const std::vector<size_t> order = RandomOrder(4, 3);
+  for (size_t i = 0; i < 4; ++i) expected.push_back("PICTURE000" + std::to_string(i + 1) + "=" + "abcd"[order[i]]);
+  RunOn({"a", "b", "c", "d"}, {.seed = 3});
+  EXPECT_EQ(There(), expected);
+}
+
+}  // namespace
+}  // namespace fotomill::test
