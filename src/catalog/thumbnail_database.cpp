@@ -44,13 +44,15 @@ std::array<uint8_t, kDatabaseHeaderSize> BytesOf(const DatabaseHeader& header) {
   return bytes;
 }
 
-bool BytesOf(const DatabaseRecord& record, std::span<uint8_t> bytes) {
+// What stands behind the thumbnail.
+using KeyBytes = std::array<uint8_t, kKeySize>;
+
+bool BytesOf(const DatabaseRecord& record, KeyBytes& bytes) {
   if (record.path.size() >= kTextSize || record.volume.size() >= kTextSize) return false;
-  std::ranges::fill(bytes, uint8_t{0});
-  std::ranges::copy(record.thumbnail.bytes, bytes.begin());
-  std::ranges::copy(record.path, bytes.begin() + kPathOffset);
-  std::ranges::copy(record.volume, bytes.begin() + kVolumeOffset);
-  bytes[kFlagsOffset] = record.deleted ? kDeletedFlag : 0;
+  bytes.fill(0);
+  std::ranges::copy(record.path, bytes.begin());
+  std::ranges::copy(record.volume, bytes.begin() + kVolumeOffset - kPathOffset);
+  bytes[kFlagsOffset - kPathOffset] = record.deleted ? kDeletedFlag : 0;
   return true;
 }
 
@@ -91,6 +93,12 @@ bool ReadHeaderOf(const platform::StoreFile& file, DatabaseHeader& header) {
   header.created = reader.Le32();
   header.appended = reader.Le32();
   return true;
+}
+
+// How many of the counted records a file of a size holds.
+int64_t RecordsIn(const DatabaseHeader& header, uint64_t size) {
+  const auto most = static_cast<int64_t>(size < kDatabaseHeaderSize ? 0 : (size - kDatabaseHeaderSize) / kDatabaseRecordSize);
+  return std::clamp<int64_t>(header.count, 0, most);
 }
 
 // Gives a database's lock back at the end of a scope.
@@ -182,6 +190,7 @@ void ThumbnailDatabase::CloseThumbnailDatabase() {
   file_.Close();
   index_.Clear();
   indexed_ = saved_ = {};
+  triedFile_ = false;
 }
 
 bool ThumbnailDatabase::ReadDatabaseHeader(DatabaseHeader& header) const { return ReadHeaderOf(file_, header); }
@@ -190,17 +199,12 @@ bool ThumbnailDatabase::WriteDatabaseHeader(const DatabaseHeader& header) {
   return file_.WriteAt(0, BytesOf(header)) && file_.Sync();
 }
 
-int64_t ThumbnailDatabase::RecordCount(const DatabaseHeader& header) const {
-  const uint64_t size = file_.Size();
-  const auto most = static_cast<int64_t>(size < kDatabaseHeaderSize ? 0 : (size - kDatabaseHeaderSize) / kDatabaseRecordSize);
-  return std::clamp<int64_t>(header.count, 0, most);
-}
+int64_t ThumbnailDatabase::RecordCount(const DatabaseHeader& header) const { return RecordsIn(header, file_.Size()); }
 
 bool ThumbnailDatabase::ReadDatabaseRecord(int64_t index, DatabaseRecord& record) const {
-  std::vector<uint8_t> bytes(kDatabaseRecordSize);
-  if (index < 0 || !file_.ReadAt(OffsetOf(index), bytes)) return false;
-  std::copy_n(bytes.begin(), record.thumbnail.bytes.size(), record.thumbnail.bytes.begin());
-  TakeKey(std::span<const uint8_t>(bytes).subspan(kPathOffset), record);
+  KeyBytes key;
+  if (index < 0 || !file_.ReadAt(OffsetOf(index), record.thumbnail.bytes, key)) return false;
+  TakeKey(key, record);
   return record.thumbnail.HasMagic(kSmallThumbnailMagic);
 }
 
@@ -230,13 +234,13 @@ bool ThumbnailDatabase::LockAndCheck(DatabaseHeader& header) {
 }
 
 ThumbnailIndex::State ThumbnailDatabase::StateOf(const DatabaseHeader& header) const {
-  return {RecordCount(header), file_.Size(), file_.Modified()};
+  const uint64_t size = file_.Size();
+  return {RecordsIn(header, size), size, file_.Modified()};
 }
 
 // Has the index know the file as it is. False when a record could not be read; the index then lacks it, and is made again
 // the next time.
-bool ThumbnailDatabase::UpdateIndex(const DatabaseHeader& header) {
-  const ThumbnailIndex::State state = StateOf(header);
+bool ThumbnailDatabase::UpdateIndex(const ThumbnailIndex::State& state) {
   if (indexed_ == state) return true;
   indexed_ = {};
   const bool large = state.count >= kLargeIndex;
@@ -296,9 +300,9 @@ bool ThumbnailDatabase::FindRecordsToReplace(std::span<const DatabaseRecord> rec
 }
 
 bool ThumbnailDatabase::WriteRecords(std::span<const DatabaseRecord> records, int64_t first) {
-  std::vector<uint8_t> bytes(kDatabaseRecordSize);
+  KeyBytes key;
   for (const DatabaseRecord& record : records) {
-    if (!BytesOf(record, bytes) || !file_.WriteAt(OffsetOf(first++), bytes)) return false;
+    if (!BytesOf(record, key) || !file_.WriteAt(OffsetOf(first++), record.thumbnail.bytes, key)) return false;
   }
   return file_.Sync();
 }
@@ -309,7 +313,7 @@ bool ThumbnailDatabase::AppendDatabaseRecords(std::span<const DatabaseRecord> re
   const Unlocker unlocker(file_);
   const int64_t first = header.count;
   if (first != RecordCount(header) || INT32_MAX - first < static_cast<int64_t>(records.size())) return false;
-  if (replace && !UpdateIndex(header)) return false;
+  if (replace && !UpdateIndex(StateOf(header))) return false;
   const bool indexed = indexed_ == StateOf(header);
   indexed_ = {};  // until all is done
   std::vector<int64_t> replaced;
@@ -345,26 +349,38 @@ bool ThumbnailDatabase::WriteDatabaseRecord(int64_t index, const DatabaseRecord&
 }
 
 bool ThumbnailDatabase::Find(const std::string& path, const std::string& volume, ThumbnailRecord& thumbnail) {
+  ThumbnailIndex::State state;
   DatabaseHeader header;
-  if (!file_.IsStill(path_) && OpenThumbnailDatabase(path_, false) != Opened::Done) return false;  // it was compacted meanwhile
+  if (!file_.IsStill(path_, state.size, state.modified)) {  // it was compacted meanwhile
+    if (OpenThumbnailDatabase(path_, false) != Opened::Done || !file_.IsStill(path_, state.size, state.modified)) return false;
+  }
   if (!ReadDatabaseHeader(header)) return false;
-  (void)UpdateIndex(header);  // what cannot be read is passed over
-  std::vector<uint8_t> bytes(kDatabaseRecordSize);
-  return index_.Find(ThumbnailIndex::HashOf(path), [&](size_t index) {
-    DatabaseKey key;
-    if (!file_.ReadAt(OffsetOf(static_cast<int64_t>(index)), bytes) || !ByteReader(bytes).Match(kSmallThumbnailMagic)) return false;
-    TakeKey(std::span<const uint8_t>(bytes).subspan(kPathOffset), key);
-    if (key.deleted || key.volume != volume || ComparisonKey(key.path) != ComparisonKey(path)) return false;
-    std::copy_n(bytes.begin(), thumbnail.bytes.size(), thumbnail.bytes.begin());
-    return true;
-  });
+  state.count = RecordsIn(header, state.size);
+  const uint32_t hash = ThumbnailIndex::HashOf(path);
+  const auto isIt = [&](size_t index) { return TakeThumbnail(static_cast<int64_t>(index), path, volume, thumbnail); };
+  // The first lookup after opening asks the saved index for this one; only the next is worth loading it.
+  if (state != indexed_ && state.count >= kLargeIndex && !std::exchange(triedFile_, true)) {
+    if (const std::optional<bool> found = ThumbnailIndex::FindInFile(IndexPath(path_), state, hash, isIt)) return *found;
+  }
+  (void)UpdateIndex(state);  // what cannot be read is passed over
+  return index_.Find(hash, isIt);
+}
+
+// The thumbnail of a record when that is not deleted and of that path and volume.
+bool ThumbnailDatabase::TakeThumbnail(int64_t index, std::string_view path, std::string_view volume,
+                                      ThumbnailRecord& thumbnail) const {
+  KeyBytes bytes;
+  DatabaseKey key;
+  if (!file_.ReadAt(OffsetOf(index), thumbnail.bytes, bytes) || !thumbnail.HasMagic(kSmallThumbnailMagic)) return false;
+  TakeKey(bytes, key);
+  return !key.deleted && key.volume == volume && ComparisonKey(key.path) == ComparisonKey(path);
 }
 
 int64_t ThumbnailDatabase::Delete(const std::string& path) {
   DatabaseHeader header;
   if (!LockAndCheck(header)) return -1;
   const Unlocker unlocker(file_);
-  if (!UpdateIndex(header)) return -1;
+  if (!UpdateIndex(StateOf(header))) return -1;
   indexed_ = {};
   std::vector<size_t> deleted;
   DatabaseKey key;

@@ -110,7 +110,8 @@ class ThumbnailDatabase {
   bool AppendDatabaseRecord(const DatabaseRecord& record) { return AppendDatabaseRecords({&record, 1}, false); }
   // Puts a record in the place of one that is counted, and has it on disk.
   bool WriteDatabaseRecord(int64_t index, const DatabaseRecord& record);
-  // The thumbnail of the first record that is not deleted, of that path and volume.
+  // The thumbnail of the first record that is not deleted, of that path and volume. False when there is none; `thumbnail`
+  // may then hold anything.
   bool Find(const std::string& path, const std::string& volume, ThumbnailRecord& thumbnail);
   // Marks every record of a path deleted, whatever its volume; how many there were, -1 when it could not be done.
   int64_t Delete(const std::string& path);
@@ -131,7 +132,8 @@ class ThumbnailDatabase {
   KeyRead TryKey(int64_t index, DatabaseKey& key) const;
   bool LockAndCheck(DatabaseHeader& header);
   ThumbnailIndex::State StateOf(const DatabaseHeader& header) const;
-  bool UpdateIndex(const DatabaseHeader& header);
+  bool UpdateIndex(const ThumbnailIndex::State& state);
+  bool TakeThumbnail(int64_t index, std::string_view path, std::string_view volume, ThumbnailRecord& thumbnail) const;
   bool BuildIndex(int64_t count);
   bool FindRecordsToReplace(std::span<const DatabaseRecord> records, int64_t first, std::vector<int64_t>& replaced) const;
   bool WriteRecords(std::span<const DatabaseRecord> records, int64_t first);
@@ -146,6 +148,7 @@ class ThumbnailDatabase {
   ThumbnailIndex index_;
   ThumbnailIndex::State indexed_;  // the file as the index knows it: in another state, someone else has changed it
   ThumbnailIndex::State saved_;    // as the saved index knows it
+  bool triedFile_ = false;         // the saved index was asked for a lookup
 };
 
 // The thumbnail of the first record of exactly that path in a database, deleted or not and on whatever volume. False as

@@ -1,8 +1,8 @@
 #include "catalog/thumbnail_index.h"
 
 #include <algorithm>
+#include <array>
 #include <bit>
-#include <cstring>
 
 #include "core/byte_reader.h"
 #include "platform/file_view.h"
@@ -14,32 +14,67 @@ namespace fotomill {
 namespace {
 
 constexpr std::string_view kMagic = "FMTDBIX1";
-constexpr size_t kStateSize = 32, kHeadSize = 40;
+constexpr size_t kHeadSize = 48, kBlockSize = 512, kCellSize = 8;
+constexpr size_t kCellsInBlock = kBlockSize / kCellSize - 1, kCellsUsed = 40;  // on an average; what is free ends a search
 constexpr size_t kSmallestTable = 1024;  // cells
 constexpr uint64_t kFactor = 0x9E3779B97F4A7C15;
 
-// Four sums side by side over 8 bytes at a time; what is left over is filled with zeros.
+uint64_t WordAt(const uint8_t* bytes) {
+  uint64_t word = 0;
+  for (int i = 0; i < 8; ++i) word |= uint64_t{bytes[i]} << (8 * i);
+  return word;
+}
+
+void PutWord(uint8_t* bytes, uint64_t word) {
+  for (int i = 0; i < 8; ++i) bytes[i] = static_cast<uint8_t>(word >> (8 * i));
+}
+
+// Of a whole number of words: two sums side by side.
 uint64_t ChecksumOf(std::span<const uint8_t> bytes, uint64_t sum) {
-  uint64_t sums[4] = {sum, kFactor, ~sum, bytes.size()};
-  uint8_t last[32] = {};
-  for (; !bytes.empty(); bytes = bytes.subspan(std::min(bytes.size(), sizeof last))) {
-    const uint8_t* from = bytes.data();
-    if (bytes.size() < sizeof last) from = static_cast<const uint8_t*>(std::memcpy(last, from, bytes.size()));
-    for (size_t i = 0; i < 4; ++i) {
-      uint64_t word;
-      std::memcpy(&word, from + 8 * i, sizeof word);
-      sums[i] = std::rotl((sums[i] ^ word) * kFactor, 29);
-    }
+  uint64_t other = ~sum;
+  for (size_t i = 0; i + 8 <= bytes.size(); i += 8) {
+    uint64_t& target = i % 16 == 0 ? sum : other;
+    target = std::rotl((target ^ WordAt(&bytes[i])) * kFactor, 29);
   }
-  return ((sums[0] * kFactor ^ sums[1]) * kFactor ^ sums[2]) * kFactor ^ sums[3];
+  return (sum ^ std::rotl(other, 32)) * kFactor;
 }
 
-uint64_t FileChecksum(std::span<const uint8_t> file) {
-  return ChecksumOf(file.subspan(kHeadSize), ChecksumOf(file.first(kStateSize), 0));
+struct Head {
+  uint64_t blocks = 0, checksum = 0;
+};
+
+using HeadBytes = std::array<uint8_t, kHeadSize>;
+
+HeadBytes BytesOf(const ThumbnailIndex::State& state, uint64_t blocks) {
+  HeadBytes bytes;
+  std::ranges::copy(kMagic, bytes.begin());
+  PutWord(&bytes[8], static_cast<uint64_t>(state.count));
+  PutWord(&bytes[16], state.size);
+  PutWord(&bytes[24], static_cast<uint64_t>(state.modified));
+  PutWord(&bytes[32], blocks);
+  PutWord(&bytes[40], ChecksumOf(std::span(bytes).first(40), 0));
+  return bytes;
 }
 
-void PutLe(std::vector<uint8_t>& bytes, uint64_t value, int count) {
-  for (int i = 0; i < count; ++i) bytes.push_back(static_cast<uint8_t>(value >> (8 * i)));
+// False unless these are the bytes of that state.
+bool ReadHead(std::span<const uint8_t, kHeadSize> bytes, const ThumbnailIndex::State& state, Head& head) {
+  head = {WordAt(&bytes[32]), WordAt(&bytes[40])};
+  return std::ranges::equal(bytes, BytesOf(state, head.blocks)) && head.blocks > 0;
+}
+
+uint64_t HomeBlock(uint32_t hash, uint64_t blocks) { return static_cast<uint64_t>(hash) * blocks >> 32; }
+
+uint64_t BlockChecksum(const uint8_t* block, uint64_t number, const Head& head) {
+  return ChecksumOf({block + 8, kBlockSize - 8}, head.checksum + number * kFactor);
+}
+
+struct Cell {
+  uint32_t hash = 0;
+  uint32_t record = 0;  // + 1; 0: a free cell
+};
+Cell CellAt(const uint8_t* block, size_t place) {
+  const uint64_t word = WordAt(block + kCellSize * (1 + place));
+  return {static_cast<uint32_t>(word), static_cast<uint32_t>(word >> 32)};
 }
 
 // Whether a name may be taken for an index: there is an older one, or nothing yet. The file is then open.
@@ -118,42 +153,74 @@ void ThumbnailIndex::MakeTable(size_t records) {
   }
 }
 
+std::optional<bool> ThumbnailIndex::FindInFile(const std::string& path, const State& state, uint32_t hash,
+                                               const std::function<bool(size_t record)>& take) {
+  platform::StoreFile file;
+  HeadBytes headBytes;
+  Head head;
+  if (state.count < 0 || file.Open(path, platform::StoreFile::Mode::Read) != platform::StoreFile::OpenResult::Done) return {};
+  if (!file.ReadAt(0, headBytes) || !ReadHead(headBytes, state, head)) return {};
+  std::array<uint8_t, kBlockSize> block;
+  for (uint64_t i = 0, number = HomeBlock(hash, head.blocks); i < head.blocks; ++i, number = (number + 1) % head.blocks) {
+    if (!file.ReadAt(kHeadSize + number * kBlockSize, block)) return {};
+    if (WordAt(block.data()) != BlockChecksum(block.data(), number, head)) return {};
+    for (size_t place = 0; place < kCellsInBlock; ++place) {
+      const Cell cell = CellAt(block.data(), place);
+      if (cell.record == 0) return false;
+      if (cell.hash != hash) continue;
+      if (cell.record > static_cast<uint64_t>(state.count)) return {};
+      if (take(cell.record - 1)) return true;
+    }
+  }
+  return false;
+}
+
 bool ThumbnailIndex::Load(const std::string& path, const State& state) {
   Clear();
   platform::FileView file;
+  Head head;
   if (state.count < 0 || !file.Open(path)) return false;
   const std::span<const uint8_t> bytes = file.Bytes();
-  const auto count = static_cast<size_t>(state.count);
-  ByteReader reader(bytes);
-  if (!reader.Match(kMagic)) return false;
-  const State saved{static_cast<int64_t>(reader.Le64()), reader.Le64(), static_cast<int64_t>(reader.Le64())};
-  const uint64_t checksum = reader.Le64();
-  const std::span<const uint8_t> list = reader.Take(uint64_t{count} * 4);
-  if (!reader.Ok() || saved != state || checksum != FileChecksum(bytes.first(kHeadSize + list.size()))) return false;
-  ByteReader hashes(list);
-  hashes_.reserve(count);
-  for (size_t i = 0; i < count; ++i) hashes_.push_back(hashes.Le32());
-  if (!file.Intact()) {
+  if (bytes.size() < kHeadSize || !ReadHead(bytes.first<kHeadSize>(), state, head)) return false;
+  if (head.blocks > (bytes.size() - kHeadSize) / kBlockSize) return false;
+  hashes_.assign(static_cast<size_t>(state.count), 0);
+  bool whole = true;
+  for (uint64_t number = 0; whole && number < head.blocks; ++number) {
+    const uint8_t* const block = &bytes[kHeadSize + number * kBlockSize];
+    whole = WordAt(block) == BlockChecksum(block, number, head);
+    for (size_t place = 0; whole && place < kCellsInBlock; ++place) {
+      const Cell cell = CellAt(block, place);
+      if (cell.record == 0) break;
+      whole = cell.record <= hashes_.size() && cell.hash != 0;
+      if (whole) hashes_[cell.record - 1] = cell.hash;
+    }
+  }
+  if (!whole || !file.Intact()) {
     Clear();
     return false;
   }
-  MakeTable(count);
+  MakeTable(hashes_.size());
   return true;
 }
 
 void ThumbnailIndex::Save(const std::string& path, const State& state) const {
-  std::vector<uint8_t> bytes(kMagic.begin(), kMagic.end());
-  bytes.reserve(kHeadSize + 4 * hashes_.size());
-  PutLe(bytes, static_cast<uint64_t>(state.count), 8);
-  PutLe(bytes, state.size, 8);
-  PutLe(bytes, static_cast<uint64_t>(state.modified), 8);
-  PutLe(bytes, 0, 8);
-  for (const uint32_t hash : hashes_) PutLe(bytes, hash, 4);
-  const uint64_t checksum = FileChecksum(bytes);
-  for (size_t i = 0; i < 8; ++i) bytes[kStateSize + i] = static_cast<uint8_t>(checksum >> (8 * i));
+  const uint64_t count = hashes_.size() / kCellsUsed + 1;
+  const HeadBytes headBytes = BytesOf(state, count);
+  const Head head{count, WordAt(&headBytes[40])};
+  std::vector<uint8_t> blocks(count * kBlockSize), used(count);
+  for (size_t i = 0; i < hashes_.size(); ++i) {
+    if (hashes_[i] == 0) continue;
+    uint64_t number = HomeBlock(hashes_[i], count);
+    while (used[number] == kCellsInBlock) number = (number + 1) % count;
+    PutWord(&blocks[number * kBlockSize + kCellSize * ++used[number]], hashes_[i] | uint64_t{i + 1} << 32);
+  }
+  for (uint64_t number = 0; number < count; ++number) {
+    uint8_t* const block = &blocks[number * kBlockSize];
+    PutWord(block, BlockChecksum(block, number, head));
+  }
   platform::StoreFile file;
-  // In place and unsynced, as what a crash or another process makes of it shows in the checksum.
-  if (OpenForSaving(path, file)) (void)file.WriteAt(0, bytes);
+  // In place and unsynced, as what a crash or another process makes of it shows in the checksums.
+  if (OpenForSaving(path, file)) (void)file.WriteAt(0, headBytes, blocks);
 }
 
 }  // namespace fotomill

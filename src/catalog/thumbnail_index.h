@@ -1,6 +1,8 @@
 #pragma once
 
 #include <cstdint>
+#include <functional>
+#include <optional>
 #include <span>
 #include <string>
 #include <string_view>
@@ -21,8 +23,12 @@ namespace fotomill {
 //        8    8      count of records
 //       16    8      size of the database
 //       24    8      its modification time, nanoseconds since 1970
-//       32    8      checksum of the first four fields and all that follows this one
-//       40    4 x n  hash of each record, 0 of those that cannot be found
+//       32    8      count of blocks
+//       40    8      checksum of the fields before
+//       48  512 x n  blocks: a checksum of this block and the one above, 8 bytes, and 63 cells: hash of a record, and
+//                    record + 1, or 0, 0; in order of records, from the block hash x n / 2^32 on
+//
+// So a single record is found by reading one block, and blocks of two different states are never taken for one file.
 class ThumbnailIndex {
  public:
   // The state of a database file that an index belongs to.
@@ -53,6 +59,9 @@ class ThumbnailIndex {
     return false;
   }
 
+  // Finds like Find, without loading, in a file; nullopt unless what was read of it is whole and of that state.
+  static std::optional<bool> FindInFile(const std::string& path, const State& state, uint32_t hash,
+                                        const std::function<bool(size_t record)>& take);
   // Fills the index from a file. False, with the index empty, unless the file is whole and of that state.
   bool Load(const std::string& path, const State& state);
   // Writes the file, over an older index only. Silent when that fails, as nothing is lost.

@@ -27,6 +27,9 @@ class StoreFile {
   // All or nothing: false when fewer bytes were read or written.
   [[nodiscard]] bool ReadAt(uint64_t offset, std::span<uint8_t> bytes) const;
   [[nodiscard]] bool WriteAt(uint64_t offset, std::span<const uint8_t> bytes);
+  // The same with bytes that lie in two places, one after the other in the file.
+  [[nodiscard]] bool ReadAt(uint64_t offset, std::span<uint8_t> first, std::span<uint8_t> second) const;
+  [[nodiscard]] bool WriteAt(uint64_t offset, std::span<const uint8_t> first, std::span<const uint8_t> second);
   [[nodiscard]] bool Sync();
   // Waits for the exclusive lock on the file, which two StoreFiles never hold together, in one process or in two. Advisory
   // between programs that ask for it. False when it cannot be had, or when the program was asked to end meanwhile.
@@ -34,9 +37,12 @@ class StoreFile {
   void Unlock();
   // Whether `path` still names this very file; after waiting for a lock another process may have replaced it.
   bool IsStill(const std::string& path) const;
+  // The same with its size and time, all in one question to the system.
+  bool IsStill(const std::string& path, uint64_t& size, int64_t& modified) const;
 
  private:
   int64_t handle_ = -1;
+  uint64_t device_ = 0, identity_ = 0;  // of the open file
 };
 
 // Holds a lock for a scope.

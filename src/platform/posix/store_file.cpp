@@ -3,6 +3,7 @@
 #include <fcntl.h>
 #include <sys/file.h>
 #include <sys/stat.h>
+#include <sys/uio.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -29,16 +30,23 @@ bool IsNoName(const std::string& path, int error) {
   return (error == ENOENT || error == ENOTDIR) && (lstat(path.c_str(), &facts) != 0 || !S_ISLNK(facts.st_mode));
 }
 
+int64_t Nanoseconds(const struct stat& facts) {
+  return int64_t{facts.st_mtim.tv_sec} * 1'000'000'000 + facts.st_mtim.tv_nsec;
+}
+
 bool InRange(uint64_t offset, size_t size) { return offset <= INT64_MAX && size <= INT64_MAX - offset; }
 
 }  // namespace
 
-StoreFile::StoreFile(StoreFile&& other) noexcept : handle_(std::exchange(other.handle_, -1)) {}
+StoreFile::StoreFile(StoreFile&& other) noexcept
+    : handle_(std::exchange(other.handle_, -1)), device_(other.device_), identity_(other.identity_) {}
 
 StoreFile& StoreFile::operator=(StoreFile&& other) noexcept {
   if (this != &other) {
     Close();
     handle_ = std::exchange(other.handle_, -1);
+    device_ = other.device_;
+    identity_ = other.identity_;
   }
   return *this;
 }
@@ -47,14 +55,17 @@ StoreFile::OpenResult StoreFile::Open(const std::string& path, Mode mode) {
   Close();
   if (FaultDue()) return OpenResult::Failed;
   Handle handle;
+  struct stat facts;
   if (mode == Mode::CreateNew) {
     handle = OpenHandle(path.c_str(), O_RDWR | O_CREAT | O_EXCL | O_NOFOLLOW, 0666);
     if (!handle.IsOpen()) return errno == EEXIST ? OpenResult::Exists : OpenResult::Failed;
+    if (fstat(handle.Number(), &facts) != 0) return OpenResult::Failed;
   } else {
-    struct stat facts;
     handle = OpenRegular(path.c_str(), mode == Mode::Read ? O_RDONLY : O_RDWR | O_NOFOLLOW, facts);
     if (!handle.IsOpen()) return IsNoName(path, errno) ? OpenResult::Missing : OpenResult::Failed;
   }
+  device_ = facts.st_dev;
+  identity_ = facts.st_ino;
   handle_ = handle.Release();
   return OpenResult::Done;
 }
@@ -70,8 +81,7 @@ uint64_t StoreFile::Size() const {
 
 int64_t StoreFile::Modified() const {
   struct stat facts;
-  if (fstat(static_cast<int>(handle_), &facts) != 0) return 0;
-  return int64_t{facts.st_mtim.tv_sec} * 1'000'000'000 + facts.st_mtim.tv_nsec;
+  return fstat(static_cast<int>(handle_), &facts) == 0 ? Nanoseconds(facts) : 0;
 }
 
 bool StoreFile::ReadAt(uint64_t offset, std::span<uint8_t> bytes) const {
@@ -83,6 +93,22 @@ bool StoreFile::ReadAt(uint64_t offset, std::span<uint8_t> bytes) const {
 bool StoreFile::WriteAt(uint64_t offset, std::span<const uint8_t> bytes) {
   if (!IsOpen() || !InRange(offset, bytes.size()) || FaultDue()) return false;
   return WriteFully(static_cast<int>(handle_), bytes.data(), bytes.size(), static_cast<int64_t>(offset));
+}
+
+bool StoreFile::ReadAt(uint64_t offset, std::span<uint8_t> first, std::span<uint8_t> second) const {
+  const size_t size = first.size() + second.size();
+  if (!IsOpen() || !InRange(offset, size) || FaultDue()) return false;
+  const iovec parts[] = {{first.data(), first.size()}, {second.data(), second.size()}};
+  if (preadv(static_cast<int>(handle_), parts, 2, static_cast<off_t>(offset)) == static_cast<ssize_t>(size)) return true;
+  return ReadAt(offset, first) && ReadAt(offset + first.size(), second);  // it was interrupted, or the file ends there
+}
+
+bool StoreFile::WriteAt(uint64_t offset, std::span<const uint8_t> first, std::span<const uint8_t> second) {
+  const size_t size = first.size() + second.size();
+  if (!IsOpen() || !InRange(offset, size) || FaultDue()) return false;
+  const iovec parts[] = {{const_cast<uint8_t*>(first.data()), first.size()}, {const_cast<uint8_t*>(second.data()), second.size()}};
+  if (pwritev(static_cast<int>(handle_), parts, 2, static_cast<off_t>(offset)) == static_cast<ssize_t>(size)) return true;
+  return WriteAt(offset, first) && WriteAt(offset + first.size(), second);  // it was interrupted, or there is no room
 }
 
 bool StoreFile::Sync() { return IsOpen() && !FaultDue() && SyncHandle(static_cast<int>(handle_)); }
@@ -105,9 +131,17 @@ void StoreFile::Unlock() {
 }
 
 bool StoreFile::IsStill(const std::string& path) const {
-  struct stat own, named;
-  return IsOpen() && fstat(static_cast<int>(handle_), &own) == 0 && stat(path.c_str(), &named) == 0 &&
-         own.st_dev == named.st_dev && own.st_ino == named.st_ino;
+  uint64_t size;
+  int64_t modified;
+  return IsStill(path, size, modified);
+}
+
+bool StoreFile::IsStill(const std::string& path, uint64_t& size, int64_t& modified) const {
+  struct stat named;
+  if (!IsOpen() || stat(path.c_str(), &named) != 0 || named.st_dev != device_ || named.st_ino != identity_) return false;
+  size = static_cast<uint64_t>(named.st_size);
+  modified = Nanoseconds(named);
+  return true;
 }
 
 }  // namespace fotomill::platform
