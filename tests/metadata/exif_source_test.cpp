@@ -33,17 +33,15 @@ Bytes WebpChunk(std::string_view type, const Bytes& contents) {
   return Of(type) + Bytes{size[1], size[0], 0, 0} + contents + Bytes(contents.size() % 2);
 }
 
-struct FileCase {
-  const char* name;
-  Bytes bytes, block;
-};
-
-std::vector<FileCase> Files() {
+TEST(ExifSource, FindsTheBlockOfEveryKindOfFile) {
   const Bytes block = BigEndianBlock(), little = LittleEndianBlock(), none;
   const Bytes mark = Hex("45786966 0000"), far(20000);  // more than the head that is read first
   const Bytes start = Hex("FFD8"), app1 = Segment(0xe1, mark + block), scan = Hex("FFDA 0002");
   const Bytes png = Hex("89504E47 0D0A1A0A"), webp = Hex("52494646 00000000 57454250");
-  return {
+  const struct {
+    const char* name;
+    Bytes bytes, block;
+  } files[] = {
       {"JPEG, another APP1 first", start + Segment(0xe1, Of("http://ns.adobe.com/")) + app1 + scan, block},
       {"JPEG, fill bytes", start + Bytes{0xff, 0xff} + app1, block},
       {"JPEG, behind long segments", start + Segment(0xe2, far) + Segment(0xe2, far) + app1, block},
@@ -65,13 +63,10 @@ std::vector<FileCase> Files() {
       {"bitmap", Hex("424D 36000000 00000000 36000000"), none},
       {"empty", {}, none},
   };
-}
-
-TEST(ExifSource, FindsTheBlockOfEveryKindOfFile) {
   const TemporaryFolder folder;
   const std::string path = folder.Path("picture");
   ExifSource source;
-  for (const FileCase& file : Files()) {
+  for (const auto& file : files) {
     SCOPED_TRACE(file.name);
     WriteBytes(path, file.bytes);
     ASSERT_EQ(source.Open(path.c_str()), Status::Ok);

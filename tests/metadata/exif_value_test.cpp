@@ -164,9 +164,8 @@ TEST(ExifValue, NormalisesRawCopies) {
 TEST(ExifTags, LookUpFunctionsKnowTagsAndOthers) {
   for (size_t i = 0; i < ExifTags().size(); ++i) EXPECT_EQ(ExifTagIndex(ExifTags()[i].tag), static_cast<int32_t>(i));
   EXPECT_EQ(ExifTagIndex(0xc4a5), kNoExifTag);
-  EXPECT_EQ(CopyExifTag(0xc4a5).name, "Unknown");
+  EXPECT_EQ(ExifTagName(0xc4a5), "Unknown");
   EXPECT_EQ(CopyExifTag(0xc4a5).tag, 0xc4a5);
-  EXPECT_EQ(ExifTagRange(0x9204).minimum, -99990);
   EXPECT_EQ(ExifTypeLabel(0xffff), "[SRATIONAL]");
   EXPECT_EQ(ExifTypeSize(12), 1u);
 }
