@@ -1,8 +1,10 @@
 #include "batch/destination_name.h"
 
 #include "core/plain_name.h"
+#include "core/settings.h"
 #include "core/text.h"
 #include "picture/registry.h"
+#include "platform/files.h"
 #include "platform/paths.h"
 
 namespace fotomill {
@@ -139,6 +141,17 @@ std::string PlannedDestination(const std::string& source, std::string_view below
   if (job.naming.beside || job.destinationFolder.empty()) return platform::JoinPath({parts.drive, parts.folder, name, {}});
   if (below.empty()) return platform::JoinFolder(job.destinationFolder, name);
   return platform::JoinFolder(platform::JoinFolder(job.destinationFolder, below), name);
+}
+
+bool IsDestinationWanted(const BatchJob& job, bool intoFolder) {
+  if (job.prompts == nullptr) return true;
+  if (settings.WarnDestinationWrite != 0) {
+    const std::string format = UpperCase(ExtensionOfFormat(job));
+    if (!job.prompts->ConfirmFormat("Write files to the " + format + " format?")) return false;
+  }
+  const std::string& folder = job.destinationFolder;
+  if (!intoFolder || folder.empty() || job.naming.beside) return true;
+  return platform::FileExists(folder) || job.prompts->ConfirmNewFolder(folder);
 }
 
 std::optional<std::string> CompletedDestination(const std::string& destination, std::string_view folder) {

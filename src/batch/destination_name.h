@@ -16,6 +16,10 @@ namespace fotomill {
 // extension, and places where either has no letter, stay as they are.
 std::string CasedExtension(std::string_view formatExtension, std::string_view sourceExtension, int32_t style);
 
+// Asks what has to be asked before anything is written: whether files of the format are wanted, and whether a destination
+// folder that is not there may be made (unless the outputs do not go `intoFolder`). False when the user wants something else.
+bool IsDestinationWanted(const BatchJob& job, bool intoFolder);
+
 // The extension of the job's outputs as the format has it.
 std::string_view ExtensionOfFormat(const BatchJob& job);
 

@@ -52,8 +52,11 @@ bool OrderedRun::InTurn(size_t item, const std::function<void()>& step) {
 
 void OrderedRun::Work() {
   for (;;) {
-    const bool goesOn = steps_.goesOn();
     std::unique_lock lock(mutex_);
+    caughtUp_.wait(lock, [this] { return stopped_ || begun_ < head_ + steps_.ahead; });
+    lock.unlock();
+    const bool goesOn = steps_.goesOn();
+    lock.lock();
     if (stopped_ || !goesOn || begun_ == states_.size()) {
       --working_;
       delivered_.notify_one();
@@ -84,6 +87,7 @@ void OrderedRun::DeliverAll() {
       steps_.deliver(head_);
       lock.lock();
       ++head_;
+      if (begun_ >= head_ + steps_.ahead - 1) caughtUp_.notify_all();
       if (head_ < begun_ && states_[head_] == State::Asking) answered_.notify_all();
     } else if (working_ == 0 && head_ == begun_) {
       return;
@@ -100,6 +104,7 @@ void OrderedRun::Stop() {
     const std::lock_guard lock(mutex_);
     stopped_ = true;
     answered_.notify_all();
+    caughtUp_.notify_all();
   }
   for (std::thread& worker : workers_) worker.join();
 }

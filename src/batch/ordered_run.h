@@ -17,6 +17,7 @@ class OrderedRun {
     std::function<void(size_t item)> deliver;  // on the calling thread, in order, once the item's work is done
     std::function<bool()> goesOn;              // on any thread, before an item is begun; false: no more are begun
     std::function<void()> tick;                // on the calling thread, a few times a second while it waits
+    size_t ahead = 1024;                       // an item is not begun while so many before it wait to be delivered
   };
 
   explicit OrderedRun(Steps steps) : steps_(std::move(steps)) {}
@@ -43,6 +44,7 @@ class OrderedRun {
   std::mutex mutex_;
   std::condition_variable delivered_;  // something for the calling thread
   std::condition_variable answered_;   // a step has run
+  std::condition_variable caughtUp_;   // items may be begun again
   std::vector<State> states_;
   std::vector<std::thread> workers_;
   size_t begun_ = 0;    // items before this one were begun

@@ -353,23 +353,12 @@ class Batch {
   Rules rules_;
 };
 
-// What is asked before anything is begun. False when the user does not want it.
-bool IsWanted(const BatchFunction& function, const BatchJob& job) {
-  if (job.prompts == nullptr || function.dryRun) return true;
-  if (settings.WarnDestinationWrite != 0) {
-    const std::string format(UpperCase(ExtensionOfFormat(job)));
-    if (!job.prompts->ConfirmFormat("Write files to the " + format + " format?")) return false;
-  }
-  const std::string& folder = job.destinationFolder;
-  const bool ownFolder = folder.empty() || job.naming.beside || !function.out.empty();
-  return ownFolder || platform::FileExists(folder) || job.prompts->ConfirmNewFolder(folder);
-}
-
 }  // namespace
 
 Status RunBatch(std::span<const BatchFile> files, const BatchFunction& function, BatchJob& job) {
   job.extension = ExtensionOfFormat(job);
-  if (!IsWanted(function, job) || !OpenProgressBox(job)) return Status::FunctionCancelled;
+  if (!function.dryRun && !IsDestinationWanted(job, function.out.empty())) return Status::FunctionCancelled;
+  if (!OpenProgressBox(job)) return Status::FunctionCancelled;
   Batch(files, function, job).Run();
   FinishProgress(job);
   return Status::Ok;

@@ -2,6 +2,7 @@
 
 #include "cli/completion.h"
 #include "cli/config.h"
+#include "cli/contact_sheet.h"
 #include "cli/convert.h"
 #include "cli/doctor.h"
 #include "cli/exif.h"
@@ -23,6 +24,7 @@ namespace {
 constexpr Command kCommands[] = {
     {"convert", "convert pictures to another format",                          Needs::Formats,  SetUpConvert},
     {"rename",  "number files, each under a base name or with its own",        Needs::Formats,  SetUpRename},
+    {"contact-sheet", "draw pictures on pages, each with its name",            Needs::Formats,  SetUpContactSheet},
     {"info",    "tell what files hold, without decoding them",                 Needs::Formats,  SetUpInfo},
     {"formats", "list the formats and what this build can do with them",       Needs::Formats,  SetUpFormats},
     {"match",   "tell which format a file name selects, without opening it",   Needs::Formats,  SetUpMatch},

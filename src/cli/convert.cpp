@@ -2,20 +2,16 @@
 
 #include <memory>
 #include <string>
-#include <utility>
-#include <vector>
 
 #include "batch/run.h"
+#include "cli/destination_format.h"
 #include "cli/file_selection.h"
 #include "cli/options.h"
 #include "cli/result_output.h"
 #include "cli/terminal_box.h"
 #include "cli/terminal_prompts.h"
-#include "core/nearest_name.h"
 #include "core/plain_name.h"
 #include "core/settings.h"
-#include "core/text.h"
-#include "picture/registry.h"
 #include "platform/files.h"
 #include "platform/paths.h"
 
@@ -44,40 +40,6 @@ struct ConvertOptions {
 };
 
 constexpr size_t kLongestPrefix = SettingPrefix::Capacity();
-
-// The row that an extension names in full; the looser rules for reading would make an AVI of "x.avif". Other spellings
-// of a format's name are taken as well.
-int32_t RowOfExtension(std::string_view extension) {
-  constexpr std::pair<std::string_view, std::string_view> kSpellings[] = {
-      {"tiff", "TIF"}, {"fits", "FIT"}, {"targa", "TGA"}, {"pict", "PCT"}};
-  if (extension.starts_with('.')) extension.remove_prefix(1);
-  for (const auto& [spelling, row] : kSpellings) {
-    if (EqualIgnoringCase(extension, spelling)) extension = row;
-  }
-  for (int32_t i = 0; i < formatCount; ++i) {
-    const FormatEntry& row = FormatRow(i);
-    const bool named = (row.flags & (FMT_SPARE | FMT_CLIPBOARD)) == 0 && EqualIgnoringCase(row.extension, extension);
-    if (named) return i;
-  }
-  if (extension.empty() || extension.find_first_of("./\\") != std::string_view::npos) return kNoFormat;
-  return FindPluginFormat("x." + std::string(extension));
-}
-
-std::string UnknownFormat(const std::string& extension) {
-  std::vector<std::string> known;
-  for (int32_t i = 0; i < formatCount; ++i) {
-    if (CanWrite(FormatRow(i))) known.push_back(LowerCase(FormatRow(i).extension));
-  }
-  for (const PluginFormatFacts& format : PluginFormats()) known.push_back(LowerCase(format.extension));
-  const std::vector<std::string_view> names(known.begin(), known.end());
-  return "There is no format \"" + extension + "\"." + NearestNameHint(extension, names);
-}
-
-// What a run converts to.
-struct Target {
-  int32_t row = kNoFormat;
-  std::string extension;  // a plug-in format's has to be kept, as its row may serve another one meanwhile
-};
 
 constexpr const char* kReduceHint = "Use --reduce to have them reduced.";
 
@@ -109,17 +71,14 @@ BatchFunction FunctionOf(const ConvertOptions& options) {
           .dryRun = options.dryRun};
 }
 
-// What is wrong with the options, as a sentence; empty when nothing is. Fills `target`.
-std::string CheckOptions(const ConvertOptions& options, const CommandContext& context, Target& target) {
+// What is wrong with the options, as a sentence; empty when nothing is. Takes the format into `job`.
+std::string CheckOptions(const ConvertOptions& options, const CommandContext& context, BatchJob& job) {
   if (options.to.empty() && options.out.empty()) return "Say with --to which format to convert to.";
-  const int32_t row = RowOfExtension(options.to.empty() ? platform::ExtensionOf(options.out) : options.to);
-  if (row == kNoFormat) {
-    return options.to.empty() ? "\"" + options.out + "\" selects no format; name one with --to."
-                              : UnknownFormat(options.to);
-  }
-  target = {row, std::string(FormatRow(row).extension)};
-  if (!CanWrite(FormatRow(row))) {
-    return std::string(FormatRow(row).extension) + " cannot be written. " + std::string(WhyNot(FormatRow(row)));
+  const std::string extension = options.to.empty() ? std::string(platform::ExtensionOf(options.out)) : options.to;
+  if (const std::string wrong = ReadDestinationFormat(extension, job); !wrong.empty()) {
+    return job.formatIndex != kNoFormat || !options.to.empty()
+               ? wrong
+               : "\"" + options.out + "\" selects no format; name one with --to.";
   }
   if (options.prefix.size() > kLongestPrefix) {
     return "The prefix is longer than " + std::to_string(kLongestPrefix) + " characters.";
@@ -134,9 +93,8 @@ std::string CheckOptions(const ConvertOptions& options, const CommandContext& co
 }
 
 int RunConvert(const ConvertOptions& options, const CommandContext& context) {
-  Target target;
-  if (const std::string wrong = CheckOptions(options, context, target); !wrong.empty())
-    return UsageError(context, wrong);
+  BatchJob job;
+  if (const std::string wrong = CheckOptions(options, context, job); !wrong.empty()) return UsageError(context, wrong);
   const auto files = SelectFiles(options.selection, context);
   if (!files) return kExitUsage;
   if (!options.out.empty() && files->size() != 1) return UsageError(context, "--out takes exactly one picture.");
@@ -145,9 +103,6 @@ int RunConvert(const ConvertOptions& options, const CommandContext& context) {
   ResultOutput output(context, options.json);
   TerminalBox box(output, options.verbose, options.overwrite.empty());
   TerminalPrompts prompts(context, output);
-  BatchJob job;
-  job.formatIndex = target.row;
-  job.extension = target.extension;
   job.destinationFolder = options.dest;
   job.box = &box;
   job.prompts = context.MayAsk() ? &prompts : nullptr;

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <string>
+#include <vector>
 
 namespace fotomill::platform {
 
@@ -14,6 +15,8 @@ enum class SpecialFolder {
   Temporary,  // $TMPDIR where it is a folder, else /tmp
 };
 std::string SpecialFolderPath(SpecialFolder folder);
+// Where fonts are kept, the user's own first; the folders may have folders in them, and need not be there.
+std::vector<std::string> FontFolders();
 
 // The running program's own file and its folder, links resolved.
 std::string ProgramPath();
