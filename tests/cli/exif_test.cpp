@@ -1,7 +1,9 @@
 #include <gmock/gmock.h>
 
 #include <nlohmann/json.hpp>
+#include <utility>
 
+#include "core/limits.h"
 #include "support/command_line.h"
 #include "support/exif_blocks.h"
 #include "support/files.h"
@@ -52,6 +54,9 @@ TEST_F(ExifCommand, PrintsTheLinesOfTheViewer) {
   EXPECT_EQ(result.status, 0);
   EXPECT_EQ(result.out, kBlockText);
   EXPECT_EQ(Exif({picture, picture}).out, picture + "\n" + kBlockText + picture + "\n" + kBlockText);
+  const uint32_t usual = std::exchange(limits.exifEntries, 3);
+  EXPECT_THAT(Exif({picture}).err, HasSubstr("picture.tif: There is more EXIF than is shown here."));
+  limits.exifEntries = usual;
 }
 
 TEST_F(ExifCommand, ShowsTypesWhenAsked) {
