@@ -182,6 +182,13 @@ std::vector<std::string> BrowserModel::FilesForFunction() const {
   return files;
 }
 
+std::vector<std::string> BrowserModel::PathsForFunction() const {
+  std::vector<std::string> paths;
+  for (const size_t line : selection_.SelectedLines()) paths.push_back(PathOfLine(line));
+  if (paths.empty() && selection_.Focus() != kNoLine) paths.push_back(PathOfLine(selection_.Focus()));
+  return paths;
+}
+
 bool BrowserModel::HasFileForFunction() const {
   const size_t focus = selection_.Focus();
   return selection_.SelectedCount() > 0 || (focus != kNoLine && !Line(focus).folder);

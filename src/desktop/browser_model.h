@@ -50,6 +50,8 @@ class BrowserModel {
   const Selection& Selected() const { return selection_; }
   // What functions work on: the selected files in list order; without a selection the focused one.
   std::vector<std::string> FilesForFunction() const;
+  // The same with folders.
+  std::vector<std::string> PathsForFunction() const;
   bool HasFileForFunction() const;
   // All files that are shown, in list order.
   std::vector<std::string> ShownFiles() const;

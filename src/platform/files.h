@@ -41,6 +41,8 @@ std::optional<std::vector<FolderEntry>> ListFolder(const std::string& path);
 
 // Deletes one file, never a folder. A path's final link is deleted itself.
 [[nodiscard]] bool DeleteFile(const std::string& path);
+// Deletes a folder that is empty.
+[[nodiscard]] bool DeleteFolder(const std::string& path);
 // Renames within one file system. A destination that is there and neither a regular file nor a link stays: Failed. Where
 // case does not count, a name may be changed to itself in other case.
 [[nodiscard]] CommitResult RenameFile(const std::string& from, const std::string& to, Existing existing);

@@ -1,5 +1,7 @@
 #!/usr/bin/env python3
 """Batches of the real program: converting, collisions, errors that keep the box open, abort."""
+import os
+
 from driven_desktop import Desktop, Failure, make_pictures, run
 
 
@@ -62,10 +64,12 @@ def convert_and_collide(folder):
 
 def errors_stay_and_abort_stops(folder):
     pictures = folder / "pictures"
-    make_pictures(pictures, [f"p{number}.bmp" for number in range(3000)])
+    make_pictures(pictures, ["p.bmp"])
+    for number in range(4000):
+        os.link(pictures / "p.bmp", pictures / f"p{number}.bmp")
     (pictures / "a.gif").write_bytes(b"GIF89a and no more")
     with Desktop(folder, pictures, settings=["DestForceSourceDir=1", "DefaultFileExtension=tif"]) as desktop:
-        desktop.wait(r"lines=3001 .*listing=0")
+        desktop.wait(r"lines=4002 .*listing=0")
         start_convert(desktop)
         confirm(desktop)
         desktop.wait(r"batch-line .*a.gif: ")
@@ -73,7 +77,7 @@ def errors_stay_and_abort_stops(folder):
         desktop.key("alt+a")
         desktop.wait(r"batch-line There were errors")
         line = desktop.wait(r"batch-line \d+ files were processed")
-        assert int(line.split()[1]) < 3001, line
+        assert int(line.split()[1]) < 4002, line
         desktop.wait(r"batch stays-open")
         desktop.wait(r"batch ended")
         written = [path for path in pictures.iterdir() if path.suffix == ".tif"]

@@ -15,7 +15,7 @@ import zlib
 from pathlib import Path
 
 PROJECT = Path(__file__).resolve().parents[2]
-PATIENCE = 10  # seconds until a test gives up waiting
+PATIENCE = 60  # seconds until a test gives up waiting
 
 
 class Failure(Exception):

@@ -53,7 +53,10 @@ class App : public wxApp {
     EnablePlugins();
     const Start start = StartFrom(argument_);
     auto* frame = new MainFrame;
-    frame->OpenTab(platform::IsFolder(start.folder) ? start.folder : platform::CurrentFolder());
+    const bool restored = frame->RestoreSession();
+    if (!restored || !argument_.empty()) {
+      frame->OpenTab(platform::IsFolder(start.folder) ? start.folder : platform::CurrentFolder());
+    }
     frame->Show();
     LogEvent("frame");
     if (!start.file.empty()) frame->ViewFiles({start.file}, start.file);

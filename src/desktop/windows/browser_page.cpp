@@ -17,6 +17,7 @@
 #include "desktop/windows/bitmaps.h"
 #include "desktop/windows/details_list.h"
 #include "desktop/windows/thumbnail_canvas.h"
+#include "desktop/windows/update_bar.h"
 #include "desktop/windows/wx_text.h"
 #include "platform/files.h"
 #include "platform/folders.h"
@@ -91,6 +92,14 @@ BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& 
   bar->Add(path_, wxSizerFlags(1).CenterVertical().Border(wxALL, gap));
   bar->Add(filter_, wxSizerFlags().CenterVertical().Border(wxRIGHT, gap));
   sizer->Add(bar, wxSizerFlags().Expand());
+  updateBar_ = new UpdateBar(this, [this](int32_t choice) {
+    if (offer_ != nullptr) offer_->Answer(choice);
+    ShowUpdateBar(false);
+    FocusList();
+  });
+  updateBar_->Hide();
+  updateBar_->MoveBeforeInTabOrder(views_);
+  sizer->Add(updateBar_, wxSizerFlags().Expand());
   sizer->Add(views_, wxSizerFlags(1).Expand());
   SetSizer(sizer);
   SetDropTarget(new FolderDrop(*this, host_));
@@ -101,7 +110,10 @@ BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& 
   });
 }
 
-BrowserPage::~BrowserPage() { StopListing(); }
+BrowserPage::~BrowserPage() {
+  StopListing();
+  StopOffer();
+}
 
 void BrowserPage::BuildPathBar() {
   path_ = new wxTextCtrl(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxTE_PROCESS_ENTER, wxDefaultValidator, "Folder");
@@ -144,6 +156,9 @@ void BrowserPage::Open(const std::string& folder, const std::string& focus, bool
     if (history_.size() > kMostHistory) history_.erase(history_.begin());
     historyPlace_ = history_.size() - 1;
   }
+  StopOffer();
+  offered_ = false;
+  ShowUpdateBar(false);
   model_.SetFolder(folder);
   model_.SetModes(ModesForFolder(folder, model_.Modes()));
   filter_->ChangeValue("");
@@ -215,6 +230,7 @@ void BrowserPage::TakeListing(FolderListing listing, bool complete) {
   }
   if (complete) {
     Watch();
+    OfferThumbnails();
     wantedFocus_.clear();
     wantedScroll_ = -1;
   }
@@ -228,6 +244,65 @@ void BrowserPage::Watch() {
   watcher_ = std::make_unique<wxFileSystemWatcher>();
   watcher_->SetOwner(this);
   watcher_->Add(wxFileName::DirName(wxString::FromUTF8(model_.Folder())));
+}
+
+// --- missing thumbnail files ---
+
+void BrowserPage::OfferThumbnails() {
+  if (offered_ || model_.ItemCount() == 0) return;
+  offered_ = true;
+  ThumbnailBrowser browser;
+  browser.folder = model_.Folder();
+  for (size_t i = 0; i < model_.ItemCount(); ++i) {
+    if (!model_.Item(i).folder) browser.files.push_back(model_.Item(i).name);
+  }
+  browser.mode = static_cast<choice::ThumbnailMode>(model_.Modes().thumbnails);
+  browser.view = static_cast<choice::ViewMode>(model_.Modes().view);
+  browser.asks = asksForUpdates_;
+  browser.lastCompaction = lastCompaction_;
+  // What the offer tells of a folder that was left meanwhile is dropped.
+  const auto weak = std::make_shared<std::weak_ptr<ThumbnailOffer>>();
+  const auto post = [this, weak](std::function<void()> action) {
+    wxTheApp->CallAfter([weak, action = std::move(action)] {
+      if (weak->lock() != nullptr) action();
+    });
+  };
+  ThumbnailOffer::Events events;
+  events.ask = [this, post](int32_t count, int32_t selected) {
+    post([this, count, selected] {
+      updateBar_->Ask(count, selected);
+      ShowUpdateBar(true);
+      LogEvent("offer", std::to_string(count));
+    });
+  };
+  events.building = [post, this](size_t done, size_t total) {
+    post([this, done, total] {
+      updateBar_->Tell(wxString::Format("Creating thumbnails: %zu of %zu", done, total));
+      ShowUpdateBar(done < total);
+    });
+  };
+  events.ended = [post, this](bool changed, const ThumbnailBrowser& after) {
+    post([this, changed, asks = after.asks, compaction = after.lastCompaction] {
+      asksForUpdates_ = asks;
+      lastCompaction_ = compaction;
+      ShowUpdateBar(false);
+      if (changed) canvas_->WantThumbnails();
+      LogEvent("offer-ended", changed ? "changed" : "unchanged");
+    });
+  };
+  offer_ = ThumbnailOffer::Start(std::move(browser), std::move(events));
+  *weak = offer_;
+}
+
+void BrowserPage::StopOffer() {
+  if (offer_ != nullptr) offer_->Stop();
+  offer_.reset();
+}
+
+void BrowserPage::ShowUpdateBar(bool show) {
+  if (updateBar_->IsShown() == show) return;
+  updateBar_->Show(show);
+  Layout();
 }
 
 // --- what is shown how ---

@@ -12,6 +12,7 @@
 #include <vector>
 
 #include "desktop/browser_model.h"
+#include "desktop/thumbnail_offer.h"
 #include "desktop/windows/thumbnail_service.h"
 
 class wxBitmapButton;
@@ -23,6 +24,7 @@ namespace fotomill::desktop {
 
 class DetailsList;
 class ThumbnailCanvas;
+class UpdateBar;
 
 // What a browser asks of its frame.
 class BrowserHost {
@@ -70,6 +72,7 @@ class BrowserPage : public wxPanel {
   bool Listing() const { return listing_; }
   size_t MissingThumbnails() const;
   int64_t Scroll() const;
+  // Scrolled so far once the folder is listed.
   void RestoreScroll(int64_t scroll) { wantedScroll_ = scroll; }
 
  private:
@@ -83,6 +86,9 @@ class BrowserPage : public wxPanel {
   void BeginDrag();
   void Watch();
   void ApplyFilter();
+  void OfferThumbnails();
+  void StopOffer();
+  void ShowUpdateBar(bool show);
 
   BrowserHost& host_;
   ThumbnailService& thumbnails_;
@@ -99,11 +105,16 @@ class BrowserPage : public wxPanel {
   std::shared_ptr<Job> job_;  // of the latest listing
   std::unique_ptr<wxFileSystemWatcher> watcher_;
   wxTimer reloadTimer_;
+  std::shared_ptr<ThumbnailOffer> offer_;  // of this folder
+  bool offered_ = false;
+  bool asksForUpdates_ = true;  // until the user wants no more offers here
+  int64_t lastCompaction_ = 0;
 
   wxBitmapButton* back_ = nullptr;
   wxBitmapButton* forward_ = nullptr;
   wxTextCtrl* path_ = nullptr;
   wxSearchCtrl* filter_ = nullptr;
+  UpdateBar* updateBar_ = nullptr;
   wxSimplebook* views_ = nullptr;
   ThumbnailCanvas* canvas_ = nullptr;
   DetailsList* details_ = nullptr;

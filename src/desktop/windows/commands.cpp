@@ -2,6 +2,7 @@
 
 #include "core/choice_lists.h"
 #include "desktop/windows/batch_runner.h"
+#include "desktop/windows/file_actions.h"
 #include "desktop/windows/main_frame.h"
 
 namespace fotomill::desktop {
@@ -42,6 +43,17 @@ void SelectSameType(MainFrame& frame) {
   }
 }
 
+// A command of the frame's file actions.
+template <void (FileActions::*action)()>
+void OfFiles(MainFrame& frame) {
+  (frame.Files().*action)();
+}
+void Cut(MainFrame& frame) { frame.Files().ToClipboard(frame.SelectedPaths(), true); }
+void Copy(MainFrame& frame) { frame.Files().ToClipboard(frame.SelectedPaths(), false); }
+void CopyPaths(MainFrame& frame) { frame.Files().PathsToClipboard(frame.SelectedPaths()); }
+void Paste(MainFrame& frame) { frame.Files().Paste(frame.CurrentFolder()); }
+void NewFolder(MainFrame& frame) { frame.Files().NewFolder(frame.CurrentFolder()); }
+
 void NewTab(MainFrame& frame) { frame.OpenTab(frame.CurrentFolder()); }
 void CloseTab(MainFrame& frame) { frame.CloseTab(); }
 void ReopenTab(MainFrame& frame) { frame.ReopenTab(); }
@@ -71,9 +83,18 @@ constexpr Command kCommands[] = {
     {kFile, "New &tab",            "Ctrl+T",       "Opens another tab on this folder.", Needs::Nothing, NewTab},
     {kFile, "&Close tab",          "Ctrl+W",       "Closes this tab.", Needs::Nothing, CloseTab},
     {kFile, "&Reopen closed tab",  "Ctrl+Shift+T", "Opens the tab that was closed last.", Needs::ClosedTab, ReopenTab},
+    {kFile, "New &folder...",      "Ctrl+Shift+N", "Makes a folder in this one.", Needs::Nothing, NewFolder},
     {kFile, nullptr},
     {kFile, "&Quit",               "Ctrl+Q",       "Ends the program.", Needs::Nothing, Quit},
 
+    {kEdit, "&Undo",               "Ctrl+Z",       "Takes the last thing done to files back.", Needs::Undo, OfFiles<&FileActions::Undo>},
+    {kEdit, "Re&do",               "Ctrl+Y",       "Does again what was taken back.", Needs::Redo, OfFiles<&FileActions::Redo>},
+    {kEdit, nullptr},
+    {kEdit, "Cu&t",                "Ctrl+X",       "Puts the files on the clipboard, to be moved.", Needs::Item, Cut},
+    {kEdit, "&Copy",               "Ctrl+C",       "Puts the files on the clipboard, to be copied.", Needs::Item, Copy, nullptr, true},
+    {kEdit, "&Paste",              "Ctrl+V",       "Copies or moves the files of the clipboard to this folder.", Needs::Nothing, Paste},
+    {kEdit, "Copy pat&hs",         "Ctrl+Shift+C", "Puts the paths of the files on the clipboard as text.", Needs::Item, CopyPaths, nullptr, true},
+    {kEdit, nullptr},
     {kEdit, "&Rename...",          "F2",           "Gives the focused file another name.", Needs::Item, OfBrowser<&BrowserPage::EditFocusedName>, nullptr, true},
     {kEdit, nullptr},
     {kEdit, "Select &all",         "Ctrl+A",       "Selects all files that are shown.", Needs::Nothing, Select<&Selection::SelectAll>},
@@ -109,6 +130,11 @@ constexpr Command kCommands[] = {
 
     {kFunctions, "&View",          "Ctrl+Return",  "Shows the focused picture in a view window.", Needs::Files, View, "view", true},
     {kFunctions, "&Convert...",    "Ctrl+E",       "Writes the selected pictures in another format.", Needs::Files, ConvertSelection, "convert", true},
+    {kFunctions, nullptr},
+    {kFunctions, "C&opy to...",    "F7",           "Copies the selected files to a folder.", Needs::Item, CopySelectionTo, "copy", true},
+    {kFunctions, "&Move to...",    "F6",           "Moves the selected files to a folder.", Needs::Item, MoveSelectionTo, "move", true},
+    {kFunctions, "&Delete",        "Delete",       "Moves the selected files to the trash.", Needs::Item, TrashSelection, "trash", true},
+    {kFunctions, "Delete for &good...", "Shift+Delete", "Deletes the selected files; this cannot be undone.", Needs::Item, DeleteSelection},
 };
 // clang-format on
 

@@ -13,7 +13,8 @@ enum class Needs {
   Nothing,
   Files,    // at least one file selected or focused
   Item,     // at least one file or folder
-  Undo,     // something to take back
+  Undo,     // something to take back; the menu item then names it
+  Redo,
   ClosedTab,
 };
 

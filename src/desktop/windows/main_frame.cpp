@@ -12,9 +12,11 @@
 #include "core/configuration.h"
 #include "core/settings.h"
 #include "desktop/event_log.h"
+#include "desktop/session.h"
 #include "desktop/windows/batch_runner.h"
 #include "desktop/windows/bitmaps.h"
 #include "desktop/windows/commands.h"
+#include "desktop/windows/file_actions.h"
 #include "desktop/windows/folder_tree.h"
 #include "desktop/windows/view_frame.h"
 #include "desktop/windows/wx_text.h"
@@ -44,12 +46,14 @@ MainFrame::MainFrame()
   SetStatusWidths(kFieldCount, widths);
   SetStatusBarPane(kMessageField);
   batches_ = std::make_unique<BatchRunner>(*this);
+  files_ = std::make_unique<FileActions>(*this);
   Bind(wxEVT_CLOSE_WINDOW, &MainFrame::OnClose, this);
   Bind(wxEVT_TIMER, [this](wxTimerEvent&) { FlushUses(); }, usesTimer_.GetId());
 }
 
 MainFrame::~MainFrame() {
   batches_.reset();
+  files_.reset();
   thumbnails_.SetListener(nullptr);
 }
 
@@ -75,7 +79,14 @@ void MainFrame::BuildMenus() {
     if (Enabled(command)) command.run(*this);
   }, kFirstCommandId, last);
   Bind(wxEVT_UPDATE_UI, [this](wxUpdateUIEvent& event) {
-    event.Enable(Enabled(Commands()[static_cast<size_t>(event.GetId() - kFirstCommandId)]));
+    const Command& command = Commands()[static_cast<size_t>(event.GetId() - kFirstCommandId)];
+    event.Enable(Enabled(command));
+    if (command.needs != Needs::Undo && command.needs != Needs::Redo) return;
+    const std::string name = command.needs == Needs::Undo ? files_->Undoable().UndoName() : files_->Undoable().RedoName();
+    const wxString text = command.text + (name.empty() ? wxString() : " " + Shown(name)) + "\t" + command.accelerator;
+    if (event.GetEventObject() == GetMenuBar() || GetMenuBar()->FindItem(event.GetId())->GetItemLabel() != text) {
+      GetMenuBar()->FindItem(event.GetId())->SetItemLabel(text);
+    }
   }, kFirstCommandId, last);
 }
 
@@ -96,7 +107,8 @@ bool MainFrame::Enabled(const Command& command) const {
     case Needs::Files: return browser != nullptr && browser->Model().HasFileForFunction();
     case Needs::Item: return browser != nullptr && browser->Model().Selected().Focus() != kNoLine;
     case Needs::ClosedTab: return HasClosedTab();
-    case Needs::Undo: return false;
+    case Needs::Undo: return files_->Undoable().CanUndo() && !files_->Busy();
+    case Needs::Redo: return files_->Undoable().CanRedo() && !files_->Busy();
     case Needs::Nothing: break;
   }
   return true;
@@ -146,6 +158,11 @@ std::vector<std::string> MainFrame::SelectedFiles() const {
   return browser == nullptr ? std::vector<std::string>() : browser->Model().FilesForFunction();
 }
 
+std::vector<std::string> MainFrame::SelectedPaths() const {
+  const BrowserPage* browser = Browser();
+  return browser == nullptr ? std::vector<std::string>() : browser->Model().PathsForFunction();
+}
+
 std::string MainFrame::CurrentFolder() const {
   const BrowserPage* browser = Browser();
   return browser == nullptr ? platform::CurrentFolder() : browser->Model().Folder();
@@ -159,6 +176,43 @@ BrowserPage* MainFrame::OpenTab(const std::string& folder) {
   page->Open(folder);
   page->FocusList();
   return page;
+}
+
+bool MainFrame::RestoreSession() {
+  const Session session = LoadSession();
+  if (session.width > 0 && session.height > 0) SetSize(FromDIP(wxSize(std::max(session.width, 400), std::max(session.height, 300))));
+  if (session.maximized) Maximize();
+  if (settings.RememberOpenWindows == 0 || session.tabs.empty()) return false;
+  for (const SessionTab& tab : session.tabs) {
+    auto* page = new BrowserPage(tabs_, *this, thumbnails_, tab.modes);
+    page->SetSort(tab.modes.sort, tab.descending);
+    tabs_->AddPage(page, Shown(platform::FileNameOf(tab.folder)));
+    page->Open(tab.folder, tab.focus);
+    page->RestoreScroll(tab.scroll);
+  }
+  tabs_->SetSelection(session.tab);
+  if (BrowserPage* browser = Browser()) {
+    browser->Activated();
+    browser->FocusList();
+  }
+  BrowserChanged();
+  return true;
+}
+
+void MainFrame::KeepSession() {
+  Session session;
+  session.maximized = IsMaximized();
+  const wxSize size = ToDIP(GetSize());
+  session.width = session.maximized ? LoadSession().width : size.x;
+  session.height = session.maximized ? LoadSession().height : size.y;
+  session.tab = static_cast<size_t>(std::max(tabs_->GetSelection(), 0));
+  for (size_t tab = 0; tab < tabs_->GetPageCount() && settings.RememberOpenWindows != 0; ++tab) {
+    const BrowserModel& model = PageAt(tab)->Model();
+    const size_t focus = model.Selected().Focus();
+    session.tabs.push_back({model.Folder(), model.Modes(), model.Descending(), PageAt(tab)->Scroll(),
+                            focus == kNoLine ? std::string() : model.Line(focus).name});
+  }
+  (void)SaveSession(session);
 }
 
 void MainFrame::CloseTab() {
@@ -234,18 +288,15 @@ void MainFrame::ViewFiles(const std::vector<std::string>& list, const std::strin
   view->Show();
 }
 
-void MainFrame::RenameFile(const std::string& path, const std::string& name) {
-  const std::string target = platform::JoinFolder(platform::AbsolutePath(path + "/.."), name);
-  const platform::CommitResult result = platform::RenameFile(path, target, platform::Existing::Refuse);
-  if (result == platform::CommitResult::Done) {
-    if (BrowserPage* browser = Browser()) browser->Open(browser->Model().Folder(), name);
-    return;
-  }
-  wxMessageBox(Shown(result == platform::CommitResult::Taken ? "There is a file \"" + name + "\" already." : "The file could not be renamed."),
-               "Rename", wxOK | wxICON_WARNING, this);
-}
+void MainFrame::RenameFile(const std::string& path, const std::string& name) { files_->Rename(path, name); }
 
-void MainFrame::DropFiles(const std::vector<std::string>&, const std::string&, bool) {}
+void MainFrame::DropFiles(const std::vector<std::string>& files, const std::string& folder, bool move) {
+  if (move) {
+    files_->MoveTo(files, folder);
+  } else {
+    files_->CopyTo(files, folder);
+  }
+}
 
 void MainFrame::SettingsChanged() {
   thumbnails_.Clear();
@@ -303,6 +354,7 @@ void MainFrame::OnClose(wxCloseEvent& event) {
     if (dialog.ShowModal() != wxID_OK) return event.Veto();
   }
   if (FoldersShown()) settings.RememberNavPaneHPosition = ToDIP(splitter_->GetSashPosition());
+  KeepSession();
   (void)SaveConfiguration();
   FlushUses();
   event.Skip();

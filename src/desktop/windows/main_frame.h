@@ -16,6 +16,7 @@ class wxSplitterWindow;
 namespace fotomill::desktop {
 
 class BatchRunner;
+class FileActions;
 class FolderTree;
 class ViewFrame;
 struct Command;
@@ -30,9 +31,13 @@ class MainFrame : public wxFrame, public BrowserHost {
   BrowserPage* Browser() const;
   // What functions work on: files selected in the browser in front, in list order, or else the focused one.
   std::vector<std::string> SelectedFiles() const;
+  // The same with folders.
+  std::vector<std::string> SelectedPaths() const;
   std::string CurrentFolder() const;
 
   BrowserPage* OpenTab(const std::string& folder);
+  // The tabs of the last run, where they are to be remembered. False when there are none.
+  bool RestoreSession();
   void CloseTab();
   void ReopenTab();
   void StepTab(int step);
@@ -41,6 +46,7 @@ class MainFrame : public wxFrame, public BrowserHost {
   bool FoldersShown() const;
   ThumbnailService& Thumbnails() { return thumbnails_; }
   BatchRunner& Batches() { return *batches_; }
+  FileActions& Files() { return *files_; }
 
   // Selects the files that the browser in front shows.
   void SelectFiles(const std::vector<std::string>& files);
@@ -72,6 +78,7 @@ class MainFrame : public wxFrame, public BrowserHost {
   void OnTabChanged(wxAuiNotebookEvent& event);
   void OnClose(wxCloseEvent& event);
   void LogState();
+  void KeepSession();
   BrowserPage* PageAt(size_t tab) const;
 
   ThumbnailService thumbnails_;
@@ -83,6 +90,7 @@ class MainFrame : public wxFrame, public BrowserHost {
   std::vector<FileUse> uses_;
   wxTimer usesTimer_;
   std::unique_ptr<BatchRunner> batches_;
+  std::unique_ptr<FileActions> files_;
 };
 
 }  // namespace fotomill::desktop

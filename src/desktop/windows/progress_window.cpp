@@ -18,7 +18,7 @@
 #include "desktop/windows/bitmaps.h"
 #include "desktop/windows/wx_text.h"
 #include "platform/clock.h"
-#include "platform/files.h"
+#include "platform/paths.h"
 
 namespace fotomill::desktop {
 
@@ -58,8 +58,18 @@ class ProgressWindow::DrawnList : public wxVListBox {
     dc.SetTextForeground(text);
     dc.SetFont(GetFont());
     const wxRect place(left, rect.y, rect.GetRight() - left - FromDIP(4), rect.height);
-    dc.DrawLabel(wxControl::Ellipsize(Shown(row.line.text), dc, wxELLIPSIZE_MIDDLE, place.width, wxELLIPSIZE_FLAGS_NONE), place,
-                 wxALIGN_CENTER_VERTICAL | wxALIGN_LEFT);
+    const auto cut = [&](const wxString& line) {
+      return wxControl::Ellipsize(line, dc, wxELLIPSIZE_MIDDLE, place.width, wxELLIPSIZE_FLAGS_NONE);
+    };
+    // Tall rows have the name above and what became of the file below.
+    const bool two = IsAboutFile(row) && rect.height >= 2 * GetCharHeight() + FromDIP(4) && row.line.text.starts_with(row.source);
+    wxString label = cut(Shown(row.line.text));
+    if (two) {
+      std::string outcome = row.line.text.substr(row.source.size());
+      outcome.erase(0, std::min(outcome.find_first_not_of(": "), outcome.size()));
+      label = cut(Shown(platform::FileNameOf(row.source))) + "\n" + cut(Shown(outcome));
+    }
+    dc.DrawLabel(label, place, wxALIGN_CENTER_VERTICAL | wxALIGN_LEFT);
   }
 
   wxCoord OnMeasureItem(size_t n) const override {

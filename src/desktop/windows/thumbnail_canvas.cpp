@@ -477,6 +477,10 @@ void ThumbnailCanvas::OnKey(wxKeyEvent& event) {
       {WXK_HOME, Step::First}, {WXK_END, Step::Last}, {WXK_PAGEUP, Step::PageUp}, {WXK_PAGEDOWN, Step::PageDown},
   };
   if (event.AltDown()) return event.Skip();
+  if (event.GetKeyCode() == WXK_TAB && !event.ControlDown()) {
+    Navigate(event.ShiftDown() ? wxNavigationKeyEvent::IsBackward : wxNavigationKeyEvent::IsForward);
+    return;
+  }
   for (const KeyStep& row : kSteps) {
     if (row.key == event.GetKeyCode()) return MoveFocus(row.step, event);
   }
@@ -544,11 +548,11 @@ void ThumbnailCanvas::FinishEdit(bool accept) {
   const size_t line = std::exchange(editedLine_, kNoLine);
   const std::string name = Utf8(editor->GetValue());
   const bool hadFocus = editor->HasFocus();
+  const bool changed = line < model_.LineCount() && editor->IsModified() && name != model_.Line(line).name;
   editor->Hide();
   editor->Destroy();
   if (hadFocus) SetFocus();
   Refresh();
-  const bool changed = line < model_.LineCount() && editor->IsModified() && name != model_.Line(line).name;
   if (accept && changed && !name.empty() && events_.renamed) events_.renamed(line, name);
 }
 

@@ -142,6 +142,8 @@ bool DeleteFile(const std::string& path) {
   return unlink(path.c_str()) == 0;
 }
 
+bool DeleteFolder(const std::string& path) { return !FaultDue() && rmdir(path.c_str()) == 0; }
+
 CommitResult RenameFile(const std::string& from, const std::string& to, Existing existing) {
   if (FaultDue()) return CommitResult::Failed;
   if (existing == Existing::Refuse) return RenameRefusing(from, to);

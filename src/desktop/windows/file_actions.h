@@ -1,0 +1,66 @@
+#pragma once
+
+#include <wx/event.h>
+
+#include <atomic>
+#include <functional>
+#include <string>
+#include <thread>
+#include <vector>
+
+#include "desktop/file_deeds.h"
+
+namespace fotomill::desktop {
+
+class MainFrame;
+
+// What the frame does to files: on a thread of its own, one thing after the other, told of in the status bar, and kept so
+// that it can be taken back.
+class FileActions : public wxEvtHandler {
+ public:
+  explicit FileActions(MainFrame& frame);
+  ~FileActions() override;
+
+  void Trash(const std::vector<std::string>& paths);
+  // Asks first.
+  void Delete(const std::vector<std::string>& paths);
+  void CopyTo(const std::vector<std::string>& paths, const std::string& folder);
+  void MoveTo(const std::vector<std::string>& paths, const std::string& folder);
+  void Rename(const std::string& path, const std::string& name);
+  // Several files at once, as the caller has planned it.
+  void RenameAll(std::vector<FileStep> steps);
+  void NewFolder(const std::string& parent);
+
+  void Undo();
+  void Redo();
+  const UndoList& Undoable() const { return undo_; }
+  bool Busy() const { return busy_; }
+  void Stop() { stop_ = true; }
+
+  // The clipboard holds the files for other programs too; `cut` asks whoever pastes to move them.
+  void ToClipboard(const std::vector<std::string>& paths, bool cut);
+  void PathsToClipboard(const std::vector<std::string>& paths);
+  void Paste(const std::string& folder);
+
+ private:
+  using Work = std::function<DeedResult(const DeedProgress& progress)>;
+  using Then = std::function<void(DeedResult result)>;
+  void Run(const std::string& what, Work work, Then then);
+  void Do(DeedKind kind, const std::vector<std::string>& paths, const std::string& folder);
+  void Finished(const std::string& what, DeedResult result, const Then& then);
+  void TellFailures(const std::vector<DeedFailure>& failures);
+
+  MainFrame& frame_;
+  UndoList undo_;
+  std::thread thread_;
+  std::atomic<bool> stop_{false};
+  bool busy_ = false;
+};
+
+// Functions of the frame's menu.
+void TrashSelection(MainFrame& frame);
+void DeleteSelection(MainFrame& frame);
+void CopySelectionTo(MainFrame& frame);
+void MoveSelectionTo(MainFrame& frame);
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,66 @@
+#include "desktop/windows/update_bar.h"
+
+#include <wx/button.h>
+#include <wx/choice.h>
+#include <wx/settings.h>
+#include <wx/sizer.h>
+#include <wx/stattext.h>
+
+#include <iterator>
+
+#include "catalog/thumbnail_update.h"
+#include "desktop/windows/wx_text.h"
+
+namespace fotomill::desktop {
+
+UpdateBar::UpdateBar(wxWindow* parent, std::function<void(int32_t choice)> answered)
+    : wxPanel(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTAB_TRAVERSAL | wxBORDER_NONE, "UpdateThumbnailsBox"),
+      answered_(std::move(answered)) {
+  SetBackgroundColour(wxSystemSettings::GetColour(wxSYS_COLOUR_INFOBK));
+  SetForegroundColour(wxSystemSettings::GetColour(wxSYS_COLOUR_INFOTEXT));
+  const int gap = FromDIP(6);
+  text_ = new wxStaticText(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxST_ELLIPSIZE_END);
+  text_->SetForegroundColour(GetForegroundColour());
+  choices_ = new wxChoice(this, wxID_ANY);
+  choices_->SetName(kThumbnailUpdateRequest);
+  choices_->SetToolTip(kThumbnailUpdateRequest);
+  for (const ThumbnailUpdateChoice& choice : kThumbnailUpdateChoices) {
+    choices_->Append(wxControl::RemoveMnemonics(wxString::FromUTF8(choice.text)));
+  }
+  choices_->SetMinSize(FromDIP(wxSize(300, -1)));
+  auto* ok = new wxButton(this, wxID_OK);
+  ok_ = ok;
+  auto* close = new wxButton(this, wxID_CLOSE, wxString::FromUTF8("\xC3\x97"), wxDefaultPosition, FromDIP(wxSize(32, -1)), wxBORDER_NONE);
+  close->SetToolTip("Close");
+  auto* sizer = new wxBoxSizer(wxHORIZONTAL);
+  sizer->Add(text_, wxSizerFlags(1).CenterVertical().Border(wxLEFT, gap * 2));
+  sizer->Add(choices_, wxSizerFlags(1).CenterVertical().Border(wxALL, gap));
+  sizer->Add(ok_, wxSizerFlags().CenterVertical());
+  sizer->Add(close, wxSizerFlags().CenterVertical().Border(wxLEFT | wxRIGHT, gap));
+  SetSizer(sizer);
+  ok->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) {
+    answered_(kThumbnailUpdateChoices[static_cast<size_t>(choices_->GetSelection())].value);
+  });
+  close->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { answered_(0); });
+}
+
+void UpdateBar::Ask(int32_t count, int32_t selected) {
+  const wxString question = Shown(ThumbnailUpdateQuestion(count));
+  text_->SetLabel(question);
+  text_->SetToolTip(question);
+  for (size_t i = 0; i < std::size(kThumbnailUpdateChoices); ++i) {
+    if (kThumbnailUpdateChoices[i].value == selected) choices_->SetSelection(static_cast<int>(i));
+  }
+  choices_->Show();
+  ok_->Show();
+  Layout();
+}
+
+void UpdateBar::Tell(const wxString& text) {
+  text_->SetLabel(text);
+  choices_->Hide();
+  ok_->Hide();
+  Layout();
+}
+
+}  // namespace fotomill::desktop

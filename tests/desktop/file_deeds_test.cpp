@@ -1,0 +1,118 @@
+#include "desktop/file_deeds.h"
+
+#include <gmock/gmock.h>
+
+#include "desktop/session.h"
+#include "support/files.h"
+#include "support/scoped_environment.h"
+
+namespace fotomill::desktop {
+namespace {
+
+using test::ReadText;
+using test::WriteText;
+using testing::ElementsAre;
+using testing::IsEmpty;
+
+class FileDeedsTest : public testing::Test {
+ protected:
+  FileDeedsTest() : data_("XDG_DATA_HOME", folder_.Path("data")) {
+    for (const char* name : {"from", "to", "from/sub"}) std::filesystem::create_directory(folder_.Path(name));
+    for (const char* name : {"a.png", "b.png", "sub/c.png"}) WriteText(From(name), name);
+  }
+  std::string From(std::string_view name) const { return folder_.Path("from/" + std::string(name)); }
+  std::string To(std::string_view name) const { return folder_.Path("to/" + std::string(name)); }
+  std::vector<std::string> Names(const char* folder) const {
+    std::vector<std::string> names;
+    for (const auto& entry : std::filesystem::directory_iterator(folder_.Path(folder))) names.push_back(entry.path().filename());
+    std::sort(names.begin(), names.end());
+    return names;
+  }
+  test::TemporaryFolder folder_;
+  test::ScopedEnvironment data_;
+};
+
+TEST_F(FileDeedsTest, EveryDeedCanBeTakenBackAndDoneAgain) {
+  for (const DeedKind kind : {DeedKind::Move, DeedKind::Copy, DeedKind::Trash}) {
+    SCOPED_TRACE(static_cast<int>(kind));
+    const DeedResult done = CarryOut(PlanDeed(kind, {From("a.png"), From("sub")}, folder_.Path("to")));
+    ASSERT_THAT(done.failures, IsEmpty());
+    EXPECT_EQ(Names("from").size(), kind == DeedKind::Copy ? 3u : 1u);
+    EXPECT_EQ(Names("to").size(), kind == DeedKind::Trash ? 0u : 2u);
+    const DeedResult undone = TakeBack(done.done);
+    EXPECT_THAT(undone.failures, IsEmpty());
+    EXPECT_THAT(Names("from"), ElementsAre("a.png", "b.png", "sub"));
+    EXPECT_THAT(Names("to"), IsEmpty());
+    EXPECT_EQ(ReadText(From("sub/c.png")), "sub/c.png");
+    const DeedResult again = CarryOut(undone.done);
+    EXPECT_THAT(again.failures, IsEmpty());
+    EXPECT_THAT(TakeBack(again.done).failures, IsEmpty());
+  }
+}
+
+TEST_F(FileDeedsTest, NothingIsEverReplaced) {
+  WriteText(To("a.png"), "there");
+  const FileDeed plan = PlanDeed(DeedKind::Copy, {From("a.png")}, folder_.Path("to"));
+  EXPECT_EQ(plan.steps[0].to, To("a [1].png"));
+  WriteText(To("a [1].png"), "came meanwhile");
+  for (const DeedKind kind : {DeedKind::Move, DeedKind::Copy}) {
+    const DeedResult result = CarryOut({kind, plan.steps});
+    EXPECT_THAT(result.done.steps, IsEmpty());
+    EXPECT_EQ(result.failures.at(0).reason, "There is a file of that name already.");
+  }
+  EXPECT_EQ(ReadText(To("a.png")) + ReadText(To("a [1].png")) + ReadText(From("a.png")), "therecame meanwhilea.png");
+  // Undoing a move whose old name was given away leaves both files.
+  const DeedResult moved = CarryOut(PlanDeed(DeedKind::Move, {From("b.png")}, folder_.Path("to")));
+  WriteText(From("b.png"), "new");
+  EXPECT_EQ(TakeBack(moved.done).failures.size(), 1u);
+  EXPECT_EQ(ReadText(From("b.png")) + ReadText(To("b.png")), "newb.png");
+  // A copy that was worked on stays as well.
+  const DeedResult copied = CarryOut(PlanDeed(DeedKind::Copy, {From("sub/c.png")}, folder_.Path("to")));
+  WriteText(To("c.png"), "was worked on");
+  EXPECT_EQ(TakeBack(copied.done).failures.size(), 1u);
+  EXPECT_EQ(ReadText(To("c.png")), "was worked on");
+}
+
+TEST_F(FileDeedsTest, AFolderDoesNotGoIntoItself) {
+  for (const DeedKind kind : {DeedKind::Move, DeedKind::Copy}) {
+    EXPECT_EQ(CarryOut(PlanDeed(kind, {From("sub")}, From("sub"))).failures.size(), 1u);
+  }
+  EXPECT_THAT(Names("from/sub"), ElementsAre("c.png"));
+  // Links are deleted, never what they lead to.
+  std::filesystem::create_directory_symlink(folder_.Path("to"), From("sub/link"));
+  WriteText(To("kept"), "kept");
+  EXPECT_THAT(DeleteForGood({From("sub")}).failures, IsEmpty());
+  EXPECT_THAT(Names("from"), ElementsAre("a.png", "b.png"));
+  EXPECT_EQ(ReadText(To("kept")), "kept");
+}
+
+TEST(UndoList, KeepsSoMany) {
+  UndoList list(2);
+  const auto deed = [](const char* name) { return FileDeed{DeedKind::Rename, {{name, "x"}}}; };
+  for (const char* name : {"a", "b", "c"}) list.Add(deed(name));
+  list.Add({});
+  EXPECT_EQ(list.UndoName(), "rename of c");
+  list.Undone(list.TakeUndo());
+  EXPECT_EQ(list.RedoName(), "rename of c");
+  list.Redone(list.TakeRedo());
+  list.Undone(list.TakeUndo());
+  list.Undone(list.TakeUndo());
+  EXPECT_FALSE(list.CanUndo());
+  list.Add(deed("d"));
+  EXPECT_FALSE(list.CanRedo());
+}
+
+TEST(Session, ComesBackAndForgivesOddLines) {
+  Session session{900, 600, true, 1, {{"/a=b [Tab]", {1, 4, 3}, true, 1234, "x.png"}, {"/c", {}, false, 0, ""}}};
+  EXPECT_EQ(ParseSession(SessionText(session)), session);
+  session.tabs[1].folder = "/new\nline";
+  EXPECT_EQ(ParseSession(SessionText(session)).tabs.size(), 1u);
+  const Session odd = ParseSession("Folder=/lost\r\n[Tab]\r\nFolder=/x\r\nScroll=-5\r\nViewMode=99999999999\r\nnonsense\r\n[Tab]\n[Frame]\nTab=-1");
+  ASSERT_EQ(odd.tabs.size(), 1u);
+  EXPECT_EQ(odd.tabs[0].folder, "/x");
+  EXPECT_EQ(odd.tabs[0].scroll, 0);
+  EXPECT_EQ(odd.tab, 0u);
+}
+
+}  // namespace
+}  // namespace fotomill::desktop

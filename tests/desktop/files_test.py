@@ -1,0 +1,72 @@
+#!/usr/bin/env python3
+"""What the real program does to files, and takes back; thumbnail files; the session that comes back."""
+from driven_desktop import Desktop, make_pictures, run
+
+
+def names(folder):
+    return sorted(path.name for path in folder.iterdir())
+
+
+def rename_delete_undo_paste(folder):
+    pictures, other = folder / "pictures", folder / "other"
+    make_pictures(pictures, ["a.bmp", "b.bmp"])
+    other.mkdir()
+    with Desktop(folder, pictures, settings=["UpdateThumbnailsFlag=0"]) as desktop:
+        desktop.wait(r"lines=2 .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        # The base name is marked: what is typed replaces it and leaves the extension.
+        desktop.key("Home", "F2")
+        desktop.type("zebra")
+        desktop.key("Return")
+        desktop.wait(r"files Rename done=1 failed=0")
+        desktop.wait(r"lines=2 .*listing=0 .*focus=zebra.bmp")
+        assert names(pictures) == ["b.bmp", "zebra.bmp"], names(pictures)
+        desktop.key("Delete")
+        desktop.wait(r"files Deletion of zebra.bmp done=1")
+        desktop.wait(r"lines=1 .*focus=b.bmp")
+        assert names(pictures) == ["b.bmp"]
+        desktop.key("ctrl+z")
+        desktop.wait(r"files Undo deletion of zebra.bmp done=1")
+        desktop.key("ctrl+z")
+        desktop.wait(r"files Undo rename of a.bmp done=1")
+        desktop.wait(r"listed 2")
+        assert names(pictures) == ["a.bmp", "b.bmp"], names(pictures)
+        # Copied here, pasted there; pasted where it is, it gets a number.
+        desktop.key("ctrl+a", "ctrl+c", "ctrl+v")
+        desktop.wait(r"files Copy of 2 files done=2 failed=0")
+        assert names(pictures) == ["a [1].bmp", "a.bmp", "b [1].bmp", "b.bmp"], names(pictures)
+        desktop.key("ctrl+l")
+        desktop.type(str(other) + "\n")
+        desktop.wait(r"lines=0 .*listing=0 .*folder=.*other$")
+        desktop.key("ctrl+v")
+        desktop.wait(r"files Copy of 2 files done=2 failed=0")
+        assert names(other) == ["a.bmp", "b.bmp"]
+        desktop.wait(r"lines=2 .*listing=0 .*folder=.*other$")
+        desktop.key("alt+Left")
+        desktop.wait(r"lines=4 .*listing=0 .*folder=.*pictures$")
+
+
+def thumbnails_and_session(folder):
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["a.bmp", "b.bmp"])
+    with Desktop(folder, pictures) as desktop:
+        desktop.wait(r"offer 2")
+        desktop.focus("Fotomill Professional")
+        desktop.screenshot("update-thumbnails")
+        # From the list to the bar above it; OK makes them.
+        desktop.key("ctrl+5", "ctrl+t")
+        desktop.wait(r"browser tabs=2 .*view=4")
+        desktop.wait(r"offer 2")
+        desktop.key("shift+Tab", "shift+Tab", "Return")
+        desktop.wait(r"offer-ended changed")
+        assert (pictures / "a.THN").stat().st_size == 27912
+        desktop.key("Home", "Right")
+        desktop.wait(r"focus=b.bmp")
+        desktop.key("ctrl+q")
+        desktop.wait_end()
+        desktop.arguments = []
+        desktop.start()
+        desktop.wait(r"browser tabs=2 lines=2 .*listing=0 view=4 .*focus=b.bmp folder=.*pictures$")
+
+
+run(rename_delete_undo_paste, thumbnails_and_session)
