@@ -47,7 +47,7 @@ int32_t DestinationPosition(std::span<const std::string> extensions, std::string
   return found == extensions.end() ? -1 : static_cast<int32_t>(found - extensions.begin());
 }
 
-void FillDestinations(SetupDialog& dialog, const DestinationExtensions& destinations, const KeyRow& row, SetupValues values) {
+void FillDestinations(SetupDialog& dialog, const DestinationSource& destinations, const KeyRow& row, SetupValues values) {
   const std::vector<std::string> extensions = destinations.Extensions();
   dialog.SetChoices(row.control, extensions);
   dialog.Select(row.control, DestinationPosition(extensions, TextOf(row, values)));
@@ -60,7 +60,7 @@ SpinRange RangeIn(const SetupDialog& dialog, const KeyRow& row) {
   return range ? *range : SpinRangeOf(row);
 }
 
-void FillControl(SetupDialog& dialog, const DestinationExtensions& destinations, const KeyRow& row, SetupValues values) {
+void FillControl(SetupDialog& dialog, const DestinationSource& destinations, const KeyRow& row, SetupValues values) {
   if ((row.type & KEY_FLAG) != 0) {
     dialog.SetChecked(row.control, NumberOf(row, values) != 0);
   } else if ((row.type & KEY_DESTINATION) != 0) {
@@ -99,14 +99,14 @@ int32_t ChoiceIn(const SetupDialog& dialog, const KeyRow& row) {
   return position < 0 || position == PositionOf(row, NumberIn(row)) ? NumberIn(row) : ValueAt(row, position);
 }
 
-std::string DestinationIn(const SetupDialog& dialog, const DestinationExtensions& destinations, const KeyRow& row) {
+std::string DestinationIn(const SetupDialog& dialog, const DestinationSource& destinations, const KeyRow& row) {
   const std::vector<std::string> extensions = destinations.Extensions();
   const auto position = static_cast<size_t>(dialog.Selected(row.control));
   if (position >= extensions.size() || EqualIgnoringCase(extensions[position], TextIn(row))) return std::string(TextIn(row));
   return extensions[position];
 }
 
-std::string ValueIn(const SetupDialog& dialog, const DestinationExtensions& destinations, const KeyRow& row) {
+std::string ValueIn(const SetupDialog& dialog, const DestinationSource& destinations, const KeyRow& row) {
   if ((row.type & KEY_FLAG) != 0) return std::to_string(FlagIn(dialog, row));
   if ((row.type & KEY_DESTINATION) != 0) return DestinationIn(dialog, destinations, row);
   if ((row.type & KEY_CHOICE) != 0) return std::to_string(ChoiceIn(dialog, row));
@@ -114,7 +114,7 @@ std::string ValueIn(const SetupDialog& dialog, const DestinationExtensions& dest
   return dialog.Text(row.control);
 }
 
-ControlValue ReadControl(const SetupDialog& dialog, const DestinationExtensions& destinations, const KeyRow& row) {
+ControlValue ReadControl(const SetupDialog& dialog, const DestinationSource& destinations, const KeyRow& row) {
   ControlValue control{&row, ValueIn(dialog, destinations, row), {}};
   if (control.text == ValueText(row)) return control;  // whatever it is, it was there before
   const SettingValue value = ReadValue(row, control.text, ValueSource::Person);
@@ -132,14 +132,14 @@ ControlValue ReadControl(const SetupDialog& dialog, const DestinationExtensions&
 
 }  // namespace
 
-void FillSetupDialog(SetupDialog& dialog, const DestinationExtensions& destinations, std::span<const KeyRow> rows,
+void FillSetupDialog(SetupDialog& dialog, const DestinationSource& destinations, std::span<const KeyRow> rows,
                      SetupValues values) {
   for (const KeyRow& row : rows) {
     if (row.control != 0 && dialog.Has(row.control)) FillControl(dialog, destinations, row, values);
   }
 }
 
-bool ShowsDefault(const SetupDialog& dialog, const DestinationExtensions& destinations, const KeyRow& row) {
+bool ShowsDefault(const SetupDialog& dialog, const DestinationSource& destinations, const KeyRow& row) {
   if ((row.type & KEY_FLAG) != 0) return dialog.IsChecked(row.control) == (DefaultNumber(row) != 0);
   if ((row.type & KEY_DESTINATION) != 0) {
     return dialog.Selected(row.control) == DestinationPosition(destinations.Extensions(), DefaultText(row));
@@ -149,7 +149,7 @@ bool ShowsDefault(const SetupDialog& dialog, const DestinationExtensions& destin
   return dialog.Text(row.control) == DefaultValueText(row);
 }
 
-std::optional<SetupFault> ReadSetupDialog(const SetupDialog& dialog, const DestinationExtensions& destinations,
+std::optional<SetupFault> ReadSetupDialog(const SetupDialog& dialog, const DestinationSource& destinations,
                                           std::span<const KeyRow> rows) {
   std::vector<ControlValue> controls;
   for (const KeyRow& row : rows) {

@@ -35,9 +35,9 @@ class SetupDialog {
 };
 
 // What a combo of destination formats offers: extensions in the order in which they are shown.
-class DestinationExtensions {
+class DestinationSource {
  public:
-  virtual ~DestinationExtensions() = default;
+  virtual ~DestinationSource() = default;
   virtual std::vector<std::string> Extensions() const = 0;
 };
 
@@ -45,10 +45,10 @@ enum class SetupValues { InForce, Default };
 
 // Fills every control of the dialog that edits a key with the key's value, its limit, range or choices. With the defaults
 // no key changes until ReadSetupDialog takes them up.
-void FillSetupDialog(SetupDialog& dialog, const DestinationExtensions& destinations, std::span<const KeyRow> rows = Keys(),
+void FillSetupDialog(SetupDialog& dialog, const DestinationSource& destinations, std::span<const KeyRow> rows = Keys(),
                      SetupValues values = SetupValues::InForce);
 // Whether the control of a row shows what it would show for the row's default.
-bool ShowsDefault(const SetupDialog& dialog, const DestinationExtensions& destinations, const KeyRow& row);
+bool ShowsDefault(const SetupDialog& dialog, const DestinationSource& destinations, const KeyRow& row);
 
 // A control whose value cannot be taken.
 struct SetupFault {
@@ -58,7 +58,7 @@ struct SetupFault {
 
 // The dialog's OK: takes up what its controls hold, all or nothing. Returns the first control that holds what its key cannot;
 // then no key has changed. Changed keys are saved by the next SaveConfiguration even if --set gave them.
-std::optional<SetupFault> ReadSetupDialog(const SetupDialog& dialog, const DestinationExtensions& destinations,
+std::optional<SetupFault> ReadSetupDialog(const SetupDialog& dialog, const DestinationSource& destinations,
                                           std::span<const KeyRow> rows = Keys());
 
 // To be called when the user changes a control: sets the setup-changed mark when the control's key asks for it.

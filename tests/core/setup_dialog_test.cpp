@@ -48,7 +48,7 @@ class FakeDialog : public SetupDialog {
   std::map<uint32_t, Control> controls_;
 };
 
-class FourFormats : public DestinationExtensions {
+class FourFormats : public DestinationSource {
  public:
   std::vector<std::string> Extensions() const override { return {"bmp", "jpg", "png", "tif"}; }
 };
