@@ -15,6 +15,7 @@
 #include "core/settings.h"
 #include "core/text.h"
 #include "desktop/browser_model.h"
+#include "desktop/windows/override_box.h"
 #include "desktop/windows/wx_text.h"
 #include "picture/registry.h"
 #include "platform/files.h"
@@ -107,8 +108,7 @@ void DestinationDialog::UpdateControls() {
   const DestinationChoice choice = Choice();
   folder_->Enable(into_->GetValue());
   browse_->Enable(into_->GetValue());
-  const int32_t row = formats_[static_cast<size_t>(format_->GetSelection())].row;
-  options_->Show(FormatRow(row).options != nullptr);
+  options_->Show(HasOverrideBox(choice.extension));
   const std::string problem = DestinationProblem(choice);
   ok_->Enable(problem.empty() && (!into_->GetValue() || !choice.folder.empty()));
   const std::string first = FirstDestination(choice, files_.front());
@@ -120,8 +120,7 @@ void DestinationDialog::UpdateControls() {
 }
 
 void DestinationDialog::ShowFormatOptions() {
-  const FormatEntry& row = FormatRow(formats_[static_cast<size_t>(format_->GetSelection())].row);
-  if (row.options != nullptr) (void)row.options(this, 0);
+  (void)ShowOverrideBox(this, formats_[static_cast<size_t>(format_->GetSelection())].extension);
 }
 
 void DestinationDialog::Browse() {
@@ -132,7 +131,7 @@ void DestinationDialog::Browse() {
 
 // Shift brings up the format's own options on the way.
 void DestinationDialog::OnOk(wxCommandEvent& event) {
-  if (wxGetKeyState(WXK_SHIFT) && settings.AllowDestinationOverrides != 0) ShowFormatOptions();
+  if (wxGetKeyState(WXK_SHIFT) && ShiftOpensOverrideBox()) ShowFormatOptions();
   const DestinationChoice choice = Choice();
   if (!choice.folder.empty()) (void)AddToHistoryList(HistoryList::Destination, platform::AbsolutePath(choice.folder));
   settings.DefaultFileExtension.AssignCut(choice.extension);

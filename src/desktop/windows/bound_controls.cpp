@@ -1,0 +1,107 @@
+#include "desktop/windows/bound_controls.h"
+
+#include <wx/checkbox.h>
+#include <wx/choice.h>
+#include <wx/spinctrl.h>
+#include <wx/stattext.h>
+#include <wx/textctrl.h>
+
+#include "core/shown_text.h"
+#include "core/whole_number.h"
+#include "desktop/windows/colour_button.h"
+#include "desktop/windows/mask_list.h"
+#include "desktop/windows/wx_text.h"
+#include "picture/registry.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+// Every byte of a text that is not UTF-8 as the character of its number.
+wxString AsCharacters(std::string_view text) {
+  wxString shown;
+  for (const char c : text) shown += static_cast<wchar_t>(static_cast<unsigned char>(c));
+  return shown;
+}
+
+}  // namespace
+
+void BoundControls::SetChecked(uint32_t control, bool checked) {
+  if (auto* box = wxDynamicCast(Find(control), wxCheckBox)) box->SetValue(checked);
+}
+
+bool BoundControls::IsChecked(uint32_t control) const {
+  const auto* box = wxDynamicCast(Find(control), wxCheckBox);
+  return box != nullptr && box->IsChecked();
+}
+
+void BoundControls::SetText(uint32_t control, std::string_view text) {
+  wxWindow* const window = Find(control);
+  foreignTexts_.erase(control);
+  wxString shown = wxString::FromUTF8(text.data(), text.size());
+  if (!IsUtf8(text)) {
+    shown = AsCharacters(text);
+    foreignTexts_.insert({control, {std::string(text), shown}});
+  }
+  if (auto* mask = dynamic_cast<MaskList*>(window)) {
+    mask->SetMask(ParseNumber<int32_t>(text).value_or(0));
+  } else if (auto* spin = wxDynamicCast(window, wxSpinCtrl)) {
+    spin->SetValue(ParseNumber<int32_t>(text).value_or(0));
+  } else if (auto* field = wxDynamicCast(window, wxTextCtrl)) {
+    field->ChangeValue(shown);
+  }
+}
+
+std::string BoundControls::Text(uint32_t control) const {
+  wxWindow* const window = Find(control);
+  if (const auto* mask = dynamic_cast<const MaskList*>(window)) return std::to_string(mask->Mask());
+  if (const auto* spin = wxDynamicCast(window, wxSpinCtrl)) return Utf8(spin->GetTextValue());
+  if (const auto* label = wxDynamicCast(window, wxStaticText)) return Utf8(label->GetLabelText());
+  const auto* field = wxDynamicCast(window, wxTextCtrl);
+  if (field == nullptr) return {};
+  const auto foreign = foreignTexts_.find(control);
+  const bool unchanged = foreign != foreignTexts_.end() && foreign->second.second == field->GetValue();
+  return unchanged ? foreign->second.first : Utf8(field->GetValue());
+}
+
+void BoundControls::LimitText(uint32_t control, size_t bytes) {
+  if (auto* field = wxDynamicCast(Find(control), wxTextCtrl)) field->SetMaxLength(static_cast<unsigned long>(bytes));
+}
+
+void BoundControls::SetRange(uint32_t control, const SpinRange& range) {
+  auto* spin = wxDynamicCast(Find(control), wxSpinCtrl);
+  if (spin == nullptr) return;
+  spin->SetRange(range.minimum, range.maximum);
+  spin->SetIncrement(range.step);
+}
+
+void BoundControls::SetColour(uint32_t control, int32_t colour) {
+  if (auto* button = dynamic_cast<ColourButton*>(Find(control))) button->SetSetting(colour);
+}
+
+int32_t BoundControls::Colour(uint32_t control) const {
+  const auto* button = dynamic_cast<const ColourButton*>(Find(control));
+  return button == nullptr ? 0 : button->Setting();
+}
+
+void BoundControls::SetChoices(uint32_t control, std::span<const std::string> texts) {
+  auto* choice = wxDynamicCast(Find(control), wxChoice);
+  if (choice == nullptr) return;
+  wxArrayString items;
+  for (const std::string& text : texts) items.Add(Shown(text));
+  // A list that is emptied for a moment loses the keyboard.
+  if (choice->GetStrings() != items) choice->Set(items);
+}
+
+void BoundControls::Select(uint32_t control, int32_t position) {
+  if (auto* choice = wxDynamicCast(Find(control), wxChoice)) choice->SetSelection(position);
+}
+
+int32_t BoundControls::Selected(uint32_t control) const {
+  const auto* choice = wxDynamicCast(Find(control), wxChoice);
+  return choice == nullptr ? -1 : choice->GetSelection();
+}
+
+std::vector<std::string> RegistryDestinations::Extensions() const { return fotomill::DestinationExtensions(); }
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,59 @@
+#include "desktop/windows/format_list.h"
+
+#include <wx/msgdlg.h>
+
+#include "desktop/windows/wx_text.h"
+#include "picture/format_switches.h"
+#include "picture/registry.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+enum Column { kOnColumn, kFormatColumn, kBuildColumn };
+
+wxString WorksHere(const FormatEntry& row) {
+  const bool reads = CanRead(row), writes = CanWrite(row);
+  if (reads && writes) return "reads and writes";
+  if (reads || writes) return reads ? "reads" : "writes";
+  return "not in this build";
+}
+
+}  // namespace
+
+FormatList::FormatList(wxWindow* parent)
+    : wxDataViewListCtrl(parent, wxID_ANY, wxDefaultPosition, parent->FromDIP(wxSize(-1, 280)), wxDV_SINGLE | wxDV_ROW_LINES) {
+  SetName("Formats");
+  AppendToggleColumn("On", wxDATAVIEW_CELL_ACTIVATABLE, FromDIP(50), wxALIGN_CENTER);
+  AppendTextColumn("Format", wxDATAVIEW_CELL_INERT, FromDIP(300));
+  AppendTextColumn("In this build", wxDATAVIEW_CELL_INERT, FromDIP(150));
+  for (const int32_t index : FormatListRows()) {
+    const FormatEntry& row = FormatRow(index);
+    wxVector<wxVariant> cells;
+    cells.push_back(row.enabled != 0);
+    cells.push_back(Shown(row.description));
+    cells.push_back(WorksHere(row));
+    AppendItem(cells, static_cast<wxUIntPtr>(index));
+  }
+  Bind(wxEVT_DATAVIEW_ITEM_VALUE_CHANGED, [this](wxDataViewEvent& event) {
+    if (event.GetColumn() == kOnColumn) Turn(event.GetItem());
+  });
+  Bind(wxEVT_DATAVIEW_ITEM_ACTIVATED, [this](wxDataViewEvent& event) {
+    const auto line = static_cast<unsigned>(ItemToRow(event.GetItem()));
+    SetToggleValue(!GetToggleValue(line, kOnColumn), line, kOnColumn);
+    Turn(event.GetItem());
+  });
+}
+
+void FormatList::Turn(const wxDataViewItem& item) {
+  const auto line = static_cast<unsigned>(ItemToRow(item));
+  const auto index = static_cast<int32_t>(GetItemData(item));
+  const bool on = GetToggleValue(line, kOnColumn);
+  if (on == (FormatRow(index).enabled != 0)) return;
+  const SaveResult saved = SwitchFormat(index, on);
+  if (saved == SaveResult::Done || saved == SaveResult::Unchanged) return;
+  wxMessageBox(Shown(std::string(SaveMessage(saved)) + " The switch is turned until the program ends."), "Formats", wxOK | wxICON_WARNING,
+               wxGetTopLevelParent(this));
+}
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,96 @@
+#include "desktop/setup_pages.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <filesystem>
+#include <set>
+
+#include "core/settings.h"
+#include "desktop/override_options.h"
+#include "desktop/setup_help.h"
+#include "picture/registry.h"
+#include "support/files.h"
+
+namespace fotomill::desktop {
+namespace {
+
+// Keys that the sources use, apart from those that only list keys.
+std::set<std::string> UsedKeys() {
+  std::set<std::string> used;
+  for (const auto& entry : std::filesystem::recursive_directory_iterator(test::SourcePath("src"))) {
+    const std::string name = entry.path().filename().string();
+    if (!entry.is_regular_file() || name == "setup_pages.cpp" || name == "override_options.cpp" || name == "spin_range.cpp") continue;
+    const std::string text = test::ReadText(entry.path().string());
+    for (const std::string_view lead : {"settings.", "KeyNumber::"}) {
+      for (size_t at = text.find(lead); at != std::string::npos; at = text.find(lead, at + 1)) {
+        const size_t start = at + lead.size();
+        size_t end = start;
+        while (end < text.size() && (std::isalnum(static_cast<unsigned char>(text[end])) != 0)) ++end;
+        used.insert(text.substr(start, end - start));
+      }
+    }
+  }
+  return used;
+}
+
+TEST(SetupPages, ShowSettingsThatDoSomethingAndExplainThem) {
+  const std::set<std::string> used = UsedKeys();
+  for (const SetupItem& item : SetupItems()) {
+    const KeyRow& row = KeyOf(item.key);
+    EXPECT_NE(row.control, 0u) << row.name << " has no control number in settings.def";
+    EXPECT_TRUE(HasHelpEntry(row.name)) << row.name << " has no entry in docs/settings.md";
+    EXPECT_TRUE(used.contains(row.name)) << row.name << " is in Setup, but nothing reads it";
+  }
+}
+
+TEST(SetupPages, SearchFindsEveryWord) {
+  struct Row {
+    const char* words;
+    KeyNumber found;
+    size_t most;  // how many others may be found with it
+  };
+  const Row rows[] = {
+      {"jpegcompression", KeyNumber::JpegCompression, 2},
+      {"JPEG quality", KeyNumber::JpegCompression, 3},
+      {"  upright   camera ", KeyNumber::ExifAdjustOrientation, 1},
+      {"trash", KeyNumber::OverwritePromptRecycle, 2},
+  };
+  for (const Row& row : rows) {
+    SCOPED_TRACE(row.words);
+    const std::vector<SetupItem> found = FindSettings(row.words);
+    EXPECT_TRUE(std::ranges::count(found, row.found, &SetupItem::key) == 1);
+    EXPECT_LE(found.size(), row.most);
+  }
+  EXPECT_TRUE(FindSettings("   ").empty());
+  EXPECT_TRUE(FindSettings("quality zebra").empty());
+}
+
+TEST(SetupHelp, EntriesArePlainTextAndEndWhereTheNextBegins) {
+  const HelpText help = HelpOn("JpegStoreDPI");
+  EXPECT_EQ(help.title, "JpegStoreDPI");
+  EXPECT_EQ(help.text, "The picture's resolution is written into JPEG files.");
+  EXPECT_EQ(HelpOn("FileHistoryDatabase").text, "The name of the history file in the data folder, without its extension .fhdb.");
+  const HelpText general = HelpOn("NoSuchKey");
+  EXPECT_EQ(general.title, "Configuration");
+  EXPECT_THAT(general.text, testing::StartsWith("Everything that can be adjusted is a named key. fotomill config list shows all of them with their values, "));
+  EXPECT_THAT(general.text, testing::HasSubstr("\n    [Fotomill]\n    JpegCompression=85\n"));
+  EXPECT_THAT(general.text, testing::HasSubstr("\n\nWhere it lies\n\n"));
+}
+
+TEST(OverrideOptions, BelongToFormatsThatAreWritten) {
+  for (const OverrideOptions& options : AllOverrideOptions()) {
+    SCOPED_TRACE(options.box);
+    EXPECT_EQ(FindOverrideOptions(options.extension), &options);
+    EXPECT_EQ(ItemsOf(options).size(), options.keys.size()) << "every option is a row of Setup";
+  }
+  EXPECT_STREQ(FindOverrideOptions("jpeg")->box, "OverrideJpgBox") << "another row of the same codec";
+  EXPECT_STREQ(FindOverrideOptions("Dib")->box, "OverrideBmpBox");
+  EXPECT_EQ(FindOverrideOptions("pcx"), nullptr) << "it has no options";
+  EXPECT_EQ(FindOverrideOptions("avi"), nullptr) << "nothing writes it";
+  EXPECT_EQ(FindOverrideOptions("zzz"), nullptr);
+}
+
+}  // namespace
+}  // namespace fotomill::desktop
