@@ -5,7 +5,9 @@
 #include "core/data_folder.h"
 #include "desktop/event_log.h"
 #include "desktop/windows/main_frame.h"
+#include "desktop/windows/override_box.h"
 #include "desktop/windows/wx_text.h"
+#include "picture/format_switches.h"
 #include "picture/registry.h"
 #include "platform/files.h"
 #include "platform/folders.h"
@@ -49,6 +51,8 @@ class App : public wxApp {
     if (!wxApp::OnInit()) return false;
     SetDataFolder({});
     (void)LoadConfiguration();
+    TakeFormatSwitches();
+    InstallOverrideBoxes();
     RunFormatStartup();
     EnablePlugins();
     const Start start = StartFrom(argument_);

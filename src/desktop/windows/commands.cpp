@@ -4,6 +4,7 @@
 #include "desktop/windows/batch_runner.h"
 #include "desktop/windows/file_actions.h"
 #include "desktop/windows/main_frame.h"
+#include "desktop/windows/tool_windows.h"
 
 namespace fotomill::desktop {
 
@@ -77,6 +78,8 @@ constexpr const char* kEdit = "&Edit";
 constexpr const char* kView = "&View";
 constexpr const char* kGo = "&Go";
 constexpr const char* kFunctions = "F&unctions";
+constexpr const char* kTools = "&Tools";
+constexpr const char* kHelp = "&Help";
 
 // clang-format off
 constexpr Command kCommands[] = {
@@ -130,11 +133,22 @@ constexpr Command kCommands[] = {
 
     {kFunctions, "&View",          "Ctrl+Return",  "Shows the focused picture in a view window.", Needs::Files, View, "view", true},
     {kFunctions, "&Convert...",    "Ctrl+E",       "Writes the selected pictures in another format.", Needs::Files, ConvertSelection, "convert", true},
+    {kFunctions, "&Get info...",   "Alt+Return",   "Tells what the selected files hold.", Needs::Files, ShowInfo, "info", true},
+    {kFunctions, "E&XIF...",       "Alt+Shift+Return", "Shows what the camera wrote into the focused picture.", Needs::Files, ShowExif, "exif", true},
     {kFunctions, nullptr},
     {kFunctions, "C&opy to...",    "F7",           "Copies the selected files to a folder.", Needs::Item, CopySelectionTo, "copy", true},
     {kFunctions, "&Move to...",    "F6",           "Moves the selected files to a folder.", Needs::Item, MoveSelectionTo, "move", true},
     {kFunctions, "&Delete",        "Delete",       "Moves the selected files to the trash.", Needs::Item, TrashSelection, "trash", true},
     {kFunctions, "Delete for &good...", "Shift+Delete", "Deletes the selected files; this cannot be undone.", Needs::Item, DeleteSelection},
+
+    {kTools, "File &history...",     "Ctrl+H",       "Lists the files used last and what for.", Needs::Nothing, ShowFileHistory, "history"},
+    {kTools, "&Compact database...", "",             "Takes deleted thumbnails out of a thumbnail database.", Needs::Nothing, ShowCompaction},
+    {kTools, "Clean up &thumbnails...", "",          "Deletes thumbnail files whose pictures are gone.", Needs::Nothing, ShowCleanUp},
+    {kTools, "&Plug-ins...",         "",             "Lists the plug-in formats and opens their settings.", Needs::Nothing, ShowPlugins},
+    {kTools, nullptr},
+    {kTools, "&Setup...",            "Ctrl+,",       "Shows all settings.", Needs::Nothing, ShowSetup, "setup"},
+
+    {kHelp, "&Configuration",        "F1",           "Tells how settings are kept.", Needs::Nothing, ShowHelp},
 };
 // clang-format on
 

@@ -1,0 +1,39 @@
+#include "desktop/windows/tool_windows.h"
+
+#include "core/setup_dialog.h"
+#include "desktop/event_log.h"
+#include "desktop/windows/exif_frame.h"
+#include "desktop/windows/history_box.h"
+#include "desktop/windows/info_frame.h"
+#include "desktop/windows/main_frame.h"
+#include "desktop/windows/plugin_box.h"
+#include "desktop/windows/setup_box.h"
+#include "desktop/windows/upkeep_boxes.h"
+
+namespace fotomill::desktop {
+
+void ShowSetup(MainFrame& frame) {
+  SetupBox(&frame, [&frame] { frame.SettingsChanged(); }).ShowModal();
+  LogEvent("setup", "closed");
+}
+
+void ShowInfo(MainFrame& frame) {
+  std::vector<std::string> files = frame.SelectedFiles();
+  if (!files.empty()) (new InfoFrame(&frame, std::move(files)))->Show();
+}
+
+void ShowExif(MainFrame& frame) {
+  const std::vector<std::string> files = frame.SelectedFiles();
+  if (!files.empty()) (new ExifFrame(&frame, files.front()))->Show();
+}
+
+void ShowFileHistory(MainFrame& frame) {
+  FileHistoryBox(frame).ShowModal();
+  LogEvent("history", "closed");
+}
+void ShowCompaction(MainFrame& frame) { CompactionBox(&frame, frame.CurrentFolder()).ShowModal(); }
+void ShowCleanUp(MainFrame& frame) { CleanUpBox(&frame, frame.CurrentFolder()).ShowModal(); }
+void ShowPlugins(MainFrame& frame) { PluginBox(&frame).ShowModal(); }
+void ShowHelp(MainFrame& frame) { ShowHelpPage(&frame, kGeneralHelpPage); }
+
+}  // namespace fotomill::desktop

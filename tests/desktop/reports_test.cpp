@@ -1,0 +1,218 @@
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <cstdlib>
+
+#include "catalog/file_history.h"
+#include "catalog/thumbnail_database.h"
+#include "core/choice_lists.h"
+#include "core/configuration.h"
+#include "core/data_folder.h"
+#include "core/settings.h"
+#include "desktop/configuration_transfer.h"
+#include "desktop/exif_report.h"
+#include "desktop/history_dates.h"
+#include "desktop/history_list.h"
+#include "desktop/info_report.h"
+#include "desktop/upkeep.h"
+#include "metadata/exif_text.h"
+#include "platform/clock.h"
+#include "platform/files.h"
+#include "support/exif_blocks.h"
+#include "support/files.h"
+#include "support/scoped_settings.h"
+
+namespace fotomill::desktop {
+namespace {
+
+using testing::ElementsAre;
+using testing::HasSubstr;
+
+// A data folder and settings of its own.
+class Reports : public testing::Test {
+ protected:
+  Reports() {
+    SetDataFolder(folder_.Path("data"));
+    (void)LoadConfiguration();
+  }
+  ~Reports() override {
+    ClearFileHistory();
+    SetDataFolder(folder_.Path("none"));
+    (void)LoadConfiguration();
+    SetDataFolder({});
+  }
+  std::string Sample(const std::string& name) {
+    test::WriteBytes(folder_.Path(name), test::ReadBytes(test::SourcePath("samples/bmp-true-colour.bmp")));
+    return folder_.Path(name);
+  }
+
+  test::ScopedSettings settings_;
+  test::TemporaryFolder folder_;
+};
+
+TEST_F(Reports, ExifRowsAreTheLinesOfTheText) {
+  const std::string path = folder_.Path("a.tif");
+  test::WriteBytes(path, test::BigEndianBlock());
+  for (const int32_t types : {0, 1}) {
+    settings.ExifShowTypes = types;
+    const ExifReport report = ReadExifReport(path);
+    EXPECT_EQ(report.status, Status::Ok);
+    std::string text;
+    for (const ExifRow& row : report.rows) text += row.heading ? row.name + "\n" : "    " + row.name + "\t" + row.text + "\n";
+    EXPECT_EQ(text, report.text);
+    EXPECT_THAT(text, HasSubstr("DIRECTORY EXIF\n"));
+    EXPECT_EQ(text.find(" [SHORT]\t") != std::string::npos, types == 1);
+  }
+  test::WriteText(folder_.Path("b.tif"), "II, but no more than that");
+  EXPECT_THAT(ReadExifReport(folder_.Path("b.tif")).problem, HasSubstr("damaged"));
+  EXPECT_THAT(ReadExifReport(Sample("c.bmp")).problem, HasSubstr("no EXIF"));
+  EXPECT_EQ(ReadExifReport(folder_.Path("none.jpg")).status, Status::FileOpenError);
+}
+
+std::string ValueOf(const std::vector<InfoSection>& sections, const std::string& title, const std::string& label) {
+  for (const InfoSection& section : sections) {
+    for (const InfoLine& line : section.lines) {
+      if (section.title == title && line.label == label) return line.value;
+    }
+  }
+  return "-";
+}
+
+TEST_F(Reports, InfoOfOneAndOfSeveral) {
+  settings.InfoResolution = 75;
+  settings.InfoUnits = choice::kCentimetres;
+  const FileInfo one = ReadFileInfo(Sample("one.bmp"));
+  EXPECT_EQ(one.status, Status::Ok);
+  EXPECT_EQ(ValueOf(one.sections, "General", "Dimensions"), "150 x 112 pixels");
+  EXPECT_EQ(ValueOf(one.sections, "General", "Print size"), "5.08 x 3.79 centimeters at 75 dots per inch");
+  EXPECT_EQ(ValueOf(one.sections, "Details", "Planes"), "1") << "the blanks in front of the codec's names are gone";
+  settings.InfoUnits = choice::kPixels;
+  const FileInfo two = ReadFileInfo(Sample("two.bmp"));
+  EXPECT_EQ(ValueOf(two.sections, "General", "Print size"), "-");
+
+  test::WriteText(folder_.Path("no.png"), "This is no picture.");
+  const FileInfo broken = ReadFileInfo(folder_.Path("no.png"));
+  EXPECT_NE(broken.status, Status::Ok);
+  EXPECT_FALSE(broken.problem.empty());
+  EXPECT_EQ(ValueOf(broken.sections, "General", "File size"), "19 bytes");
+
+  const std::vector<InfoSection> summary = SummaryOf(std::vector{one, two, broken});
+  EXPECT_EQ(ValueOf(summary, "Totals", "Files"), "3");
+  EXPECT_EQ(ValueOf(summary, "Totals", "Pictures"), "2");
+  EXPECT_EQ(ValueOf(summary, "Totals", "File size"), "101,375 bytes");
+  EXPECT_EQ(ValueOf(summary, "Could not be read", "no.png"), broken.problem);
+  EXPECT_EQ(ValueOf(summary, "The same in all", "Folder"), folder_.Path() + "/");
+  EXPECT_EQ(ValueOf(summary, "Different", "File size"), "2 different: 50,678 bytes (2 files); 19 bytes");
+  EXPECT_EQ(ValueOf(summary, "Different", "Dimensions"), "150 x 112 pixels (in 2 of 3 files)");
+  EXPECT_THAT(TextOf(broken), testing::StartsWith(folder_.Path("no.png") + "\n" + broken.problem + "\nGeneral\n    File name: no.png\n"));
+}
+
+TEST(HistoryDates, EachStyle) {
+  setenv("TZ", "UTC", 1);
+  struct {
+    int64_t seconds;
+    const char* styles[4];
+  } const rows[] = {
+      {1795287909, {"Saturday, November 21, 2026 7:05:09 p.m.", "Saturday, November 21, 2026 19:05:09", "2026-11-21 7:05 p.m.", "2026-11-21 19:05"}},
+      {0, {"Thursday, January 1, 1970 12:00:00 a.m.", "Thursday, January 1, 1970 00:00:00", "1970-01-01 12:00 a.m.", "1970-01-01 00:00"}},
+      {43200, {"Thursday, January 1, 1970 12:00:00 p.m.", "Thursday, January 1, 1970 12:00:00", "1970-01-01 12:00 p.m.", "1970-01-01 12:00"}},
+  };
+  for (const auto& row : rows) {
+    for (int32_t mode = 0; mode < 4; ++mode) EXPECT_EQ(HistoryDate(row.seconds, mode), row.styles[mode]);
+  }
+}
+
+TEST_F(Reports, HistorySortsRemovesAndForgets) {
+  settings.FileHistoryFunctions = -1;
+  ASSERT_TRUE(RecordFileHistory(Sample("a10.bmp"), FileFunction::Convert, 300, 100));
+  ASSERT_TRUE(RecordFileHistory(Sample("a2.bmp"), FileFunction::View, 100, 300));
+  ASSERT_TRUE(RecordFileHistory(Sample("B.bmp"), FileFunction::Crop, 200, 200));
+  HistoryList list;
+  list.Take();
+  const auto names = [&] {
+    std::vector<std::string> shown;
+    for (size_t row = 0; row < list.Count(); ++row) shown.push_back(list.Cell(row, choice::kColumnName));
+    return shown;
+  };
+  EXPECT_THAT(names(), ElementsAre("a2.bmp", "a10.bmp", "B.bmp"));
+  list.SortBy(choice::kColumnName);
+  EXPECT_THAT(names(), ElementsAre("B.bmp", "a10.bmp", "a2.bmp")) << "again: the other way round";
+  list.SortBy(choice::kColumnAccessed);
+  EXPECT_THAT(names(), ElementsAre("a2.bmp", "B.bmp", "a10.bmp")) << "the last use first";
+  list.SortBy(choice::kColumnFunction);
+  EXPECT_THAT(names(), ElementsAre("a10.bmp", "B.bmp", "a2.bmp"));
+  EXPECT_EQ(list.Cell(1, choice::kColumnSize), "50,678");
+  EXPECT_EQ(list.Cell(1, choice::kColumnPath), folder_.Path() + "/");
+
+  EXPECT_TRUE(list.Remove({0, 2}));
+  EXPECT_THAT(names(), ElementsAre("B.bmp"));
+  EXPECT_EQ(FileHistoryCount(), 1u);
+  EXPECT_THAT(test::ReadText(FileHistoryPath()), testing::AllOf(HasSubstr("B.bmp"), testing::Not(HasSubstr("a2"))));
+  EXPECT_TRUE(list.Clear());
+  EXPECT_FALSE(platform::FileExists(FileHistoryPath()));
+  EXPECT_EQ(FileHistoryCount(), 0u);
+}
+
+TEST_F(Reports, CompactionTellsWhatItDid) {
+  const std::string path = folder_.Path("Fotomill.tdb");
+  const auto outcome = [&] {
+    DatabaseCompaction compaction(path, false);
+    while (!compaction.Ended()) std::this_thread::yield();
+    return std::pair(compaction.Succeeded(), compaction.Outcome());
+  };
+  EXPECT_EQ(outcome(), std::pair(false, std::string("There is no thumbnail database of that name.")));
+  {
+    ThumbnailDatabase database;
+    ASSERT_EQ(database.OpenThumbnailDatabase(path, true), ThumbnailDatabase::Opened::Done);
+    std::vector<DatabaseRecord> records(2);
+    records[0].path = "/a";
+    records[1].path = "/b";
+    for (DatabaseRecord& record : records) record.thumbnail.Sign();
+    ASSERT_TRUE(database.AppendDatabaseRecords(records, false));
+    ASSERT_EQ(database.Delete("/a"), 1);
+  }
+  EXPECT_EQ(DescribeDatabase(path), "2 records, 55.6 KB");
+  EXPECT_EQ(outcome(), std::pair(true, std::string("1 record was dropped, 1 stay. The file is 27.8 KB smaller.")));
+  test::WriteText(path, "something else");
+  EXPECT_FALSE(outcome().first);
+  EXPECT_EQ(test::ReadText(path), "something else");
+}
+
+TEST_F(Reports, OrphansBelowAreFoundWhenAskedFor) {
+  Sample("a.bmp");
+  ASSERT_TRUE(platform::MakeFolders(folder_.Path("sub")));
+  for (const char* name : {"A.THN", "gone.thn", ".hidden.THN", "sub/gone.THN"}) test::WriteText(folder_.Path(name), "");
+  const std::atomic<bool> stop = false, stopped = true;
+  EXPECT_THAT(FindOrphanThumbnails(folder_.Path(), false, stop), ElementsAre(folder_.Path("gone.thn")));
+  const std::vector<std::string> all = FindOrphanThumbnails(folder_.Path(), true, stop);
+  EXPECT_THAT(all, ElementsAre(folder_.Path("gone.thn"), folder_.Path("sub/gone.THN")));
+  EXPECT_TRUE(FindOrphanThumbnails(folder_.Path(), true, stopped).empty());
+  EXPECT_TRUE(DeleteThumbnails(all).empty());
+  EXPECT_TRUE(platform::FileExists(folder_.Path("A.THN")));
+  EXPECT_FALSE(platform::FileExists(folder_.Path("sub/gone.THN")));
+  EXPECT_THAT(DeleteThumbnails(all), all) << "what is not there cannot be deleted";
+}
+
+TEST_F(Reports, SettingsTravel) {
+  EXPECT_FALSE(ExportConfiguration(folder_.Path("out.ini")).ok) << "there is nothing yet";
+  settings.JpegCompression = 42;
+  settings.PrefixCrop = std::string_view("Cut ");
+  ASSERT_TRUE(ExportConfiguration(folder_.Path("out.ini")).ok) << "what was not saved yet is saved first";
+  EXPECT_THAT(test::ReadText(folder_.Path("out.ini")), testing::AllOf(testing::StartsWith(";\r\n;\r\n;------ INI"), HasSubstr("JpegCompression=42\n")));
+  settings.JpegCompression = 80;
+  settings.UndoLevels = 3;
+  test::WriteText(folder_.Path("in.ini"), test::ReadText(folder_.Path("out.ini")) + "PngCompression=many\nNoSuchKey=1\nVersionNumber=9\n");
+  const Transfer transfer = ImportConfiguration(folder_.Path("in.ini"));
+  EXPECT_TRUE(transfer.ok);
+  EXPECT_EQ(transfer.message,
+            "2 settings were taken over; all others stay as they are. 1 value could not be used. 1 key is unknown here.");
+  EXPECT_EQ(settings.JpegCompression, 42);
+  EXPECT_EQ(settings.UndoLevels, 3);
+  EXPECT_THAT(test::ReadText(ConfigurationPath()), HasSubstr("JpegCompression=42\n"));
+  test::WriteText(folder_.Path("in.ini"), "no settings at all");
+  EXPECT_FALSE(ImportConfiguration(folder_.Path("in.ini")).ok);
+}
+
+}  // namespace
+}  // namespace fotomill::desktop

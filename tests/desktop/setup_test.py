@@ -1,0 +1,87 @@
+#!/usr/bin/env python3
+"""Setup, Get info, EXIF viewer and file history of the real program, by keyboard."""
+from driven_desktop import Desktop, make_pictures, run
+
+
+def setup_round_trip(folder):
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["a.bmp"])
+    with Desktop(folder, pictures, settings=["JpegCompression=80", "NotOurs=1"]) as desktop:
+        ini = desktop.data / "Fotomill Professional 11.ini"
+        desktop.wait(r"browser .*lines=1 .*listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+comma")
+        desktop.wait(r"setup page=Browsing")
+        desktop.focus("Setup")
+        desktop.key("shift+Tab")
+        desktop.type("jpegcompression")
+        desktop.wait(r"setup page=Saving found=1$")
+        desktop.key("Return")
+        desktop.screenshot("setup")
+        desktop.key("ctrl+a")
+        desktop.type("55")
+        desktop.key("Tab", "alt+a")
+        desktop.wait(r"setup applied changed=1")
+        text = ini.read_text()
+        assert "JpegCompression=55\n" in text and "NotOurs=1\n" in text, text
+        # A page at its defaults takes its keys' defaults along; Cancel takes up nothing.
+        desktop.key("alt+r")
+        desktop.wait(r"setup reset")
+        desktop.key("Escape")
+        desktop.wait(r"setup closed")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+comma")
+        desktop.wait(r"setup page=Browsing")
+        desktop.focus("Setup")
+        desktop.key("Down", "Down", "Down", "Down")
+        desktop.wait(r"setup page=Saving found=0")
+        desktop.key("alt+r")
+        desktop.wait(r"setup reset")
+        desktop.key("alt+a")
+        desktop.wait(r"setup applied changed=1")
+        assert "JpegCompression=75\n" in ini.read_text(), ini.read_text()
+        desktop.key("Escape")
+        desktop.wait(r"setup closed")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+q")
+        desktop.wait_end()
+
+
+def info_exif_history(folder):
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["a.bmp", "b.png"])
+    with Desktop(folder, pictures) as desktop:
+        desktop.wait(r"browser .*lines=2 .*listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+a", "alt+Return")
+        desktop.wait(r"info files=2")
+        desktop.focus("Get info")
+        desktop.screenshot("info")
+        desktop.key("Escape")
+        desktop.focus("Fotomill Professional")
+        desktop.key("alt+shift+Return")
+        desktop.wait(r"exif rows=0 ")
+        desktop.focus("EXIF")
+        desktop.key("Escape")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+h")
+        desktop.wait(r"history rows=2 sort=0")
+        desktop.focus("File history")
+        desktop.screenshot("history")
+        desktop.key("Delete")
+        desktop.wait(r"question Take .a.bmp. out")
+        desktop.focus("Remove history entries")
+        desktop.screenshot("question")
+        desktop.key("alt+r")
+        desktop.wait(r"history rows=1 sort=0")
+        history = (desktop.data / "FMWFileHistoryDatabase.fhdb").read_text()
+        assert "b.png" in history and "a.bmp" not in history, history
+        desktop.focus("File history")
+        desktop.key("Escape")
+        desktop.wait(r"history closed")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+q")
+        desktop.wait_end()
+
+
+run(setup_round_trip, info_exif_history)
