@@ -10,17 +10,17 @@ const std::vector<OverrideOptions>& AllOverrideOptions() {
   using enum KeyNumber;
   // clang-format off
   static const std::vector<OverrideOptions> options = {
-      {"BMP",  "OverrideBmpBox",  {WriteOS2Bitmaps, UseAlphaChannels}},
+      {"BMP",  "OverrideBmpBox",  {WriteOS2Bitmaps}},
       {"GIF",  "OverrideGifBox",  {WriteGIFInterlaced, CreateGif89, FXColorDither, FXBidirectional}},
-      {"HDP",  "OverrideHdpBox",  {HDPCompression, TiffResolution, PreserveEXIF}},
+      {"HDP",  "OverrideHdpBox",  {HDPCompression, TiffResolution}},
       {"ICO",  "OverrideIcoBox",  {ICOCompression}},
       {"JPG",  "OverrideJpgBox",  {JpegCompression, JpegSubsample, WriteJpegProgressive, JpegStoreDPI, TiffResolution,
-                                   PreserveEXIF, AlphaBackground}},
+                                   AlphaBackground}},
       {"MAC",  "OverrideMacBox",  {CreateMacbinaryHeader, FXMonoDither, FXThreshold}},
-      {"PNG",  "OverridePngBox",  {PngCompression, PreserveEXIF}},
+      {"PNG",  "OverridePngBox",  {PngCompression}},
       {"TGA",  "OverrideTgaBox",  {CreateTarga16}},
-      {"TIF",  "OverrideTifBox",  {TiffOptions, TiffResolution, JpegCompression, PreserveEXIF}},
-      {"WEBP", "OverrideWebPBox", {WebPLossless, WebPQualityFactor, PreserveEXIF}},
+      {"TIF",  "OverrideTifBox",  {TiffOptions, TiffResolution, JpegCompression}},
+      {"WEBP", "OverrideWebPBox", {WebPLossless, WebPQualityFactor}},
   };
   // clang-format on
   return options;
