@@ -6,6 +6,7 @@
 #include <unordered_map>
 #include <vector>
 
+#include "catalog/thumbnail_file.h"
 #include "core/choice_lists.h"
 #include "core/configuration.h"
 #include "core/data_folder.h"
@@ -44,8 +45,7 @@ struct Slot {
 };
 #pragma pack(pop)
 static_assert(sizeof(Slot) == 281);
-constexpr uint64_t kThumbnailBytes = 27912;
-constexpr uint64_t kSlotBytes = sizeof(Slot) + kThumbnailBytes;
+constexpr uint64_t kSlotBytes = sizeof(Slot) + sizeof(ThumbnailRecord);
 constexpr uint64_t kGrowth = 128;  // entries
 static_assert(kSlotBytes == 28193 && kGrowth * kSlotBytes == 3608704);
 
@@ -101,6 +101,16 @@ class HistoryList {
     return true;
   }
 
+  // The thumbnail in an entry's slot, which is filled when it is first asked for.
+  const ThumbnailRecord* Thumbnail(size_t index) {
+    const uint32_t number = order_[index];
+    const uint64_t offset = room_.Size() / kSlotBytes * sizeof(Slot) + number * sizeof(ThumbnailRecord);
+    ThumbnailRecord& record = room_.Items<ThumbnailRecord>(offset, 1)[0];
+    hasThumbnail_.resize(used_);
+    if (!hasThumbnail_[number]) hasThumbnail_[number] = ReadThumbnailFile(record, ThumbnailPathFor(PathOf(At(index))));
+    return hasThumbnail_[number] ? &record : nullptr;
+  }
+
   // Keeps the first `count` entries.
   void Cut(size_t count) {
     for (; order_.size() > count; order_.pop_back()) {
@@ -126,6 +136,7 @@ class HistoryList {
     if (free_.empty()) return used_++;
     const uint32_t number = free_.back();
     free_.pop_back();
+    if (number < hasThumbnail_.size()) hasThumbnail_[number] = false;
     return number;
   }
 
@@ -141,6 +152,7 @@ class HistoryList {
     if (!larger.Reserve(order_.size() * kGrowth * kSlotBytes)) return order_.size() < room_.Size() / kSlotBytes;
     std::memcpy(larger.Items<Slot>(0, used_).data(), Slots(), used_ * sizeof(Slot));
     room_ = std::move(larger);
+    hasThumbnail_.clear();  // they are read again rather than copied, if ever
     capacity_ += kGrowth;
     return true;
   }
@@ -150,6 +162,7 @@ class HistoryList {
   uint32_t used_ = 0;              // slots that ever held an entry
   std::vector<uint32_t> order_;    // slots as they stand in the list
   std::vector<uint32_t> free_;     // slots whose entry is gone
+  std::vector<bool> hasThumbnail_;  // of slots
   std::unordered_map<std::string, uint32_t> slotOf_;
 };
 
@@ -312,6 +325,8 @@ FileHistoryEntry FileHistoryAt(size_t index) {
   const Slot& slot = list.At(index);
   return {PathOf(slot), slot.function, slot.created, slot.accessed, slot.size};
 }
+
+const ThumbnailRecord* FileHistoryThumbnail(size_t index) { return list.Thumbnail(index); }
 
 HistoryUpdate UpdateFileHistory(std::span<const FileUse> uses, size_t* recorded) {
   if (recorded != nullptr) *recorded = 0;

@@ -5,6 +5,8 @@
 #include <string>
 #include <string_view>
 
+#include "catalog/thumbnail_record.h"
+
 namespace fotomill {
 
 // The file history: which picture files the user applied which function to, and when. A list in memory, kept between runs
@@ -61,6 +63,9 @@ struct FileHistoryEntry {
 };
 size_t FileHistoryCount();
 FileHistoryEntry FileHistoryAt(size_t index);  // from 0, the last use first
+// The thumbnail of an entry, read from its file's thumbnail file when it is first asked for; null when there is none. It
+// stays where it is until the list changes.
+const ThumbnailRecord* FileHistoryThumbnail(size_t index);
 
 // What a command did to a file.
 struct FileUse {

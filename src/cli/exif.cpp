@@ -9,6 +9,7 @@
 #include "cli/file_selection.h"
 #include "cli/options.h"
 #include "cli/result_output.h"
+#include "cli/used_files.h"
 #include "metadata/exif_source.h"
 #include "metadata/exif_text.h"
 #include "metadata/gps.h"
@@ -107,6 +108,7 @@ class ExifRun {
         continue;
       }
       output_.CountFile();
+      used_.Add(file.name);
       if (!outcome.hasExif && !options_.json) {
         output_.Note(output_.ShownMessage(file.name) + ": There is no EXIF in this file.");
       }
@@ -155,6 +157,7 @@ class ExifRun {
 
   const ExifOptions& options_;
   ResultOutput output_;
+  UsedFiles used_{FileFunction::GetInfo};
   ExifText lines_;
   std::string text_;
 };

@@ -1,19 +1,21 @@
 #include "cli/tdb.h"
 
+#include <atomic>
 #include <memory>
 #include <string>
 #include <vector>
 
+#include "batch/ordered_run.h"
 #include "catalog/thumbnail_database.h"
 #include "catalog/thumbnail_file.h"
 #include "cli/file_selection.h"
 #include "cli/options.h"
 #include "batch/picture_failure.h"
 #include "cli/result_output.h"
-#include "core/settings.h"
-#include "picture/registry.h"
+#include "cli/used_files.h"
 #include "platform/files.h"
 #include "platform/folders.h"
+#include "platform/process.h"
 
 namespace fotomill::cli {
 
@@ -23,6 +25,7 @@ struct TdbOptions {
   SelectionOptions selection;
   std::string out;
   std::string overwrite = "refuse";
+  int32_t jobs = 0;
   bool purge = false;
   bool dryRun = false;
   bool json = false;
@@ -43,23 +46,40 @@ bool OpenDatabase(ThumbnailDatabase& database, const std::string& path, bool cre
   return false;
 }
 
-// Adds pictures a few dozens at a time, as each time waits for the disk.
-class Adding {
- public:
-  Adding(ThumbnailDatabase& database, ResultOutput& output) : database_(database), output_(output) {}
+// A picture's record, made on any thread.
+struct Adding {
+  Status status = Status::Ok;
+  std::string hint;
+  std::unique_ptr<DatabaseRecord> record;
+};
 
-  void Add(const SelectedFile& file) {
-    DatabaseRecord record;
-    Status status = file.status;
-    std::string hint = file.hint;
-    if (status == Status::Ok) status = MakeRecord(file.name, record, hint);
-    if (status != Status::Ok) {
+Adding MakeRecord(const SelectedFile& file) {
+  Adding adding{file.status, file.hint, std::make_unique<DatabaseRecord>()};
+  if (adding.status != Status::Ok) return adding;
+  adding.record->path = platform::AbsolutePath(file.name);
+  if (adding.record->path.size() > PathText::Capacity()) {
+    adding.status = Status::InvalidDestination;
+    adding.hint = "Its path is longer than 260 characters.";
+    return adding;
+  }
+  adding.status = MakeThumbnailOfFile(file.name, adding.record->thumbnail);
+  adding.record->volume = VolumeKeyFor(adding.record->path);
+  return adding;
+}
+
+// Appends records a few dozens at a time, as each time waits for the disk.
+class Appending {
+ public:
+  Appending(ThumbnailDatabase& database, ResultOutput& output) : database_(database), output_(output) {}
+
+  void Add(const SelectedFile& file, Adding& adding) {
+    if (adding.status != Status::Ok) {
       Flush();
-      output_.Failure(file.name, status, hint.empty() ? OpenHint(file.name, status) : hint);
+      output_.Failure(file.name, adding.status, adding.hint.empty() ? OpenHint(file.name, adding.status) : adding.hint);
       return;
     }
     names_.push_back(file.name);
-    records_.push_back(std::move(record));
+    records_.push_back(std::move(*adding.record));
     if (records_.size() == kAddedAtOnce) Flush();
   }
 
@@ -71,6 +91,7 @@ class Adding {
         continue;
       }
       output_.CountFile();
+      used_.Add(name);
       output_.Line(output_.Shown(name));
     }
     names_.clear();
@@ -78,27 +99,33 @@ class Adding {
   }
 
  private:
-  static Status MakeRecord(const std::string& name, DatabaseRecord& record, std::string& hint) {
-    record.path = platform::AbsolutePath(name);
-    if (record.path.size() > PathText::Capacity()) {
-      hint = "Its path is longer than 260 characters.";
-      return Status::InvalidDestination;
-    }
-    PicturePointer picture;
-    RETURN_IF_BAD(LoadPictureInfo(name.c_str(), picture));
-    if (settings.ThumbnailQuickResize == 0) picture->thumbnailSide = kSmallThumbnailSide;
-    RETURN_IF_BAD(ReadPicture(*picture));
-    if (picture->image.Empty()) return Status::EmptyImage;
-    if (!MakeThumbnailRecord(record.thumbnail, *picture)) return Status::MemoryAllocationError;
-    record.volume = VolumeKeyFor(record.path);
-    return Status::Ok;
-  }
-
   ThumbnailDatabase& database_;
   ResultOutput& output_;
+  UsedFiles used_{FileFunction::Catalog};
   std::vector<std::string> names_;
   std::vector<DatabaseRecord> records_;
 };
+
+int AddFiles(const std::vector<SelectedFile>& files, uint32_t jobs, ThumbnailDatabase& database, ResultOutput& output) {
+  Appending appending(database, output);
+  std::vector<Adding> addings(files.size());
+  std::atomic<bool> goesOn = true;
+  OrderedRun run({
+      .work = [&](size_t item) { addings[item] = MakeRecord(files[item]); },
+      .deliver =
+          [&](size_t item) {
+            appending.Add(files[item], addings[item]);
+            addings[item].record.reset();
+            output.ShowProgress(item + 1, files.size());
+            goesOn = output.GoesOn();
+          },
+      .goesOn = [&] { return goesOn && platform::PendingExit() == 0; },
+      .tick = [&] { output.Tick(); },
+  });
+  run.Run(files.size(), jobs);
+  appending.Flush();
+  return output.Finish();
+}
 
 int RunAdd(const TdbOptions& options, CommandContext& context) {
   const std::string path = context.names.values[0];
@@ -119,13 +146,8 @@ int RunAdd(const TdbOptions& options, CommandContext& context) {
   }
   ThumbnailDatabase database;
   if (!OpenDatabase(database, path, true, output)) return output.Finish();
-  Adding adding(database, output);
-  for (const SelectedFile& file : *files) {
-    if (!output.GoesOn()) break;
-    adding.Add(file);
-  }
-  adding.Flush();
-  return output.Finish();
+  const uint32_t jobs = options.jobs == 0 ? platform::CoreCount() : static_cast<uint32_t>(options.jobs);
+  return AddFiles(*files, jobs, database, output);
 }
 
 int RunFind(const TdbOptions& options, CommandContext& context) {
@@ -228,6 +250,15 @@ int RunDelete(const TdbOptions& options, CommandContext& context) {
   return output.Finish();
 }
 
+class CompactionProgress : public ProgressSink {
+ public:
+  explicit CompactionProgress(ResultOutput& output) : output_(output) {}
+  void Step(int32_t done, int32_t total) override { output_.ShowProgress(static_cast<uint64_t>(done), static_cast<uint64_t>(total)); }
+
+ private:
+  ResultOutput& output_;
+};
+
 int RunCompact(const TdbOptions& options, CommandContext& context) {
   const std::string& path = context.names.values[0];
   ResultOutput output(context, false);
@@ -242,7 +273,9 @@ int RunCompact(const TdbOptions& options, CommandContext& context) {
     output.Line(std::to_string(before.count) + " -> " + std::to_string(kept) + " records");
     return kExitOk;
   }
-  const ThumbnailDatabase::Compacted result = read ? database.CompactThumbnailDatabase(options.purge) : ThumbnailDatabase::Compacted::NotRead;
+  CompactionProgress progress(output);
+  const ThumbnailDatabase::Compacted result =
+      read ? database.CompactThumbnailDatabase(options.purge, &progress) : ThumbnailDatabase::Compacted::NotRead;
   if (result == ThumbnailDatabase::Compacted::Done && database.ReadDatabaseHeader(after)) {
     output.Line(std::to_string(before.count) + " -> " + std::to_string(after.count) + " records");
     return kExitOk;
@@ -269,6 +302,7 @@ void SetUpTdbAdd(CLI::App& app, CommandContext& context) {
                              "earlier one is marked deleted.\n\nExample: fotomill tdb add Fotomill.tdb holiday --recursive");
   AddSelection(app, options->selection, context);
   context.names.Declare("DB FILE...", "The database, and pictures or folders of pictures", 1);
+  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, 256, "Pictures in work at once; 0, the default, is one a core");
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would be added");
 }
 

@@ -2,19 +2,19 @@
 
 #include <algorithm>
 #include <atomic>
-#include <condition_variable>
 #include <map>
 #include <memory>
-#include <mutex>
+#include <optional>
 #include <string>
-#include <thread>
 #include <vector>
 
+#include "batch/ordered_run.h"
 #include "catalog/thumbnail_file.h"
 #include "cli/file_selection.h"
 #include "cli/options.h"
 #include "batch/picture_failure.h"
 #include "cli/result_output.h"
+#include "cli/used_files.h"
 #include "core/settings.h"
 #include "picture/registry.h"
 #include "platform/files.h"
@@ -59,107 +59,76 @@ const char* NameOf(ThumbnailState state) {
 }
 
 Status MakeThumbnail(const std::string& name) {
-  PicturePointer picture;
-  RETURN_IF_BAD(LoadPictureInfo(name.c_str(), picture));
-  // The quick scaler's result depends on the size that it starts from.
-  if (settings.ThumbnailQuickResize == 0) picture->thumbnailSide = kSmallThumbnailSide;
-  RETURN_IF_BAD(ReadPicture(*picture));
   ThumbnailRecord record;
-  if (picture->image.Empty()) return Status::EmptyImage;
-  if (!MakeThumbnailRecord(record, *picture)) return Status::MemoryAllocationError;
+  RETURN_IF_BAD(MakeThumbnailOfFile(name, record));
   return WriteThumbnailFile(record, ThumbnailPathFor(name)) ? Status::Ok : Status::ErrorCreatingFile;
 }
 
-// Makes thumbnails on several threads; what is printed, and which of two pictures that share a thumbnail file has it in
-// the end, is as if they were made one after the other.
-class ThumbnailRun {
- public:
-  ThumbnailRun(const std::vector<SelectedFile>& files, const std::vector<bool>& wanted) : outcomes_(files.size()), files_(files) {
-    std::map<std::string, size_t> groups;
-    for (size_t i = 0; i < files.size(); ++i) {
-      if (!wanted[i]) continue;
-      const auto [found, added] = groups.try_emplace(ThumbnailPathFor(files[i].name), groups_.size());
-      if (added) groups_.emplace_back();
-      groups_[found->second].push_back(i);
-    }
-  }
-  ~ThumbnailRun() {
-    stop_ = true;
-    for (std::thread& worker : workers_) worker.join();
-  }
-  ThumbnailRun(const ThumbnailRun&) = delete;
-  ThumbnailRun& operator=(const ThumbnailRun&) = delete;
-
-  void Start(unsigned jobs) {
-    const size_t count = std::min<size_t>(jobs == 0 ? platform::CoreCount() : jobs, groups_.size());
-    for (size_t i = 0; i < count; ++i) workers_.emplace_back([this] { Work(); });
-  }
-
-  // Waits for the outcome of a wanted file. False when the run was ended before.
-  bool Wait(size_t index, Status& status) {
-    std::unique_lock lock(mutex_);
-    while (!outcomes_[index].done) {
-      if (platform::PendingExit() != 0) return false;
-      finished_.wait_for(lock, std::chrono::milliseconds(100));
-    }
-    status = outcomes_[index].status;
-    return true;
-  }
-
- private:
-  struct Outcome {
-    bool done = false;
-    Status status = Status::Ok;
-  };
-
-  void Work() {
-    while (!stop_ && platform::PendingExit() == 0) {
-      const size_t group = next_++;
-      if (group >= groups_.size()) return;
-      for (const size_t index : groups_[group]) {
-        const Status status = MakeThumbnail(files_[index].name);
-        const std::lock_guard lock(mutex_);
-        outcomes_[index] = {true, status};
-        finished_.notify_one();
-      }
-    }
-  }
-
-  std::vector<std::vector<size_t>> groups_;  // files that share a thumbnail file, in order
-  std::vector<Outcome> outcomes_;
-  const std::vector<SelectedFile>& files_;
-  std::atomic<size_t> next_{0};
-  std::atomic<bool> stop_{false};
-  std::mutex mutex_;
-  std::condition_variable finished_;
-  std::vector<std::thread> workers_;
+// A file of the selection, and what became of it.
+struct Making {
+  Status status = Status::Ok;
+  bool wanted = false;           // it lacks a current thumbnail
+  std::vector<size_t> together;  // of the first of those that share a thumbnail file: all of them that are wanted, in order
 };
 
+std::vector<Making> PlanMaking(const std::vector<SelectedFile>& files, bool force) {
+  std::vector<Making> makings(files.size());
+  std::map<std::string, size_t> firsts;
+  for (size_t i = 0; i < files.size(); ++i) {
+    makings[i].status = files[i].status;
+    makings[i].wanted = files[i].status == Status::Ok && (force || StateOf(files[i].name) != ThumbnailState::Current);
+    if (makings[i].wanted) makings[firsts.try_emplace(ThumbnailPathFor(files[i].name), i).first->second].together.push_back(i);
+  }
+  return makings;
+}
+
+void ReportMaking(const SelectedFile& file, const Making& making, ResultOutput& output, UsedFiles& used) {
+  const std::string thumbnail = ThumbnailPathFor(file.name);
+  const bool made = making.wanted && making.status == Status::Ok;
+  if (output.IsJson()) {
+    Json element;
+    PutName(element, "file", file.name);
+    PutName(element, "thumbnail", thumbnail);
+    element["made"] = made;
+    PutStatus(element, making.status);
+    output.Element(element);
+  }
+  if (making.status != Status::Ok) {
+    output.Failure(file.name, making.status, file.hint.empty() ? OpenHint(file.name, making.status) : file.hint);
+  } else if (!made) {
+    output.Note(output.ShownMessage(file.name) + ": has a thumbnail.");
+  } else {
+    output.CountFile();
+    used.Add(file.name);
+    if (!output.IsJson()) output.Line(output.Shown(file.name) + " -> " + output.Shown(thumbnail));
+  }
+}
+
+// On several threads; what is printed, and which of the pictures that share a thumbnail file has it in the end, is as if they
+// were made one after the other.
 int RunMake(const ThumbsOptions& options, const CommandContext& context) {
   const auto files = SelectFiles(options.selection, context);
   if (!files) return kExitUsage;
-  std::vector<bool> wanted;
-  for (const SelectedFile& file : *files) {
-    wanted.push_back(file.status == Status::Ok && (options.force || StateOf(file.name) != ThumbnailState::Current));
-  }
-  ResultOutput output(context, false);
-  ThumbnailRun run(*files, wanted);
-  if (!options.dryRun) run.Start(options.jobs);
-  for (size_t i = 0; i < files->size() && output.GoesOn(); ++i) {
-    const SelectedFile& file = (*files)[i];
-    Status status = file.status;
-    if (status == Status::Ok && !wanted[i]) {
-      output.Note(output.ShownMessage(file.name) + ": has a thumbnail.");
-      continue;
-    }
-    if (status == Status::Ok && !options.dryRun && !run.Wait(i, status)) break;
-    if (status != Status::Ok) {
-      output.Failure(file.name, status, file.hint.empty() ? OpenHint(file.name, status) : file.hint);
-      continue;
-    }
-    output.CountFile();
-    output.Line(output.Shown(file.name) + " -> " + output.Shown(ThumbnailPathFor(file.name)));
-  }
+  std::vector<Making> makings = PlanMaking(*files, options.force);
+  ResultOutput output(context, options.json);
+  UsedFiles used(options.dryRun ? std::nullopt : std::optional(FileFunction::Catalog));
+  std::atomic<bool> goesOn = true;
+  OrderedRun run({
+      .work =
+          [&](size_t item) {
+            if (options.dryRun) return;
+            for (const size_t i : makings[item].together) makings[i].status = MakeThumbnail((*files)[i].name);
+          },
+      .deliver =
+          [&](size_t item) {
+            ReportMaking((*files)[item], makings[item], output, used);
+            output.ShowProgress(item + 1, files->size());
+            goesOn = output.GoesOn();
+          },
+      .goesOn = [&] { return goesOn && platform::PendingExit() == 0; },
+      .tick = [&] { output.Tick(); },
+  });
+  run.Run(files->size(), options.jobs == 0 ? platform::CoreCount() : static_cast<uint32_t>(options.jobs));
   return output.Finish();
 }
 
@@ -269,6 +238,7 @@ void SetUpThumbsMake(CLI::App& app, CommandContext& context) {
   AddFlag(app, "--force", options->force, "Make thumbnails that are there and current again");
   AddNumber(app, "-j,--jobs", options->jobs, "N", 0, 256, "Pictures in work at once; 0, the default, is one a core");
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would be made");
+  AddFlag(app, "--json", options->json, "One JSON array of {file, thumbnail, made, status, message}");
 }
 
 void SetUpThumbsShow(CLI::App& app, CommandContext& context) {

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -12,7 +13,8 @@ namespace fotomill::cli {
 // cannot be written is no failure of the command.
 class UsedFiles {
  public:
-  explicit UsedFiles(FileFunction function) : function_(function) {}
+  // Without a function nothing is recorded.
+  explicit UsedFiles(std::optional<FileFunction> function) : function_(function) {}
   UsedFiles(const UsedFiles&) = delete;
   UsedFiles& operator=(const UsedFiles&) = delete;
   ~UsedFiles() {
@@ -23,7 +25,7 @@ class UsedFiles {
   void Add(const std::string& name);
 
  private:
-  FileFunction function_;
+  std::optional<FileFunction> function_;
   std::vector<FileUse> uses_;
   std::string folder_, absoluteFolder_;  // of the last file
 };

@@ -7,6 +7,7 @@
 #include "cli/options.h"
 #include "batch/picture_failure.h"
 #include "cli/result_output.h"
+#include "cli/used_files.h"
 #include "picture/registry.h"
 
 namespace fotomill::cli {
@@ -39,6 +40,7 @@ int RunVerify(const VerifyOptions& options, const CommandContext& context) {
   const auto files = SelectFiles(options.selection, context);
   if (!files) return kExitUsage;
   ResultOutput output(context, options.json);
+  UsedFiles used(FileFunction::View);
   for (const SelectedFile& file : *files) {
     if (!output.GoesOn()) break;
     std::string hint = file.hint;
@@ -54,6 +56,7 @@ int RunVerify(const VerifyOptions& options, const CommandContext& context) {
       continue;
     }
     output.CountFile();
+    used.Add(file.name);
     if (!output.IsJson()) output.Line(output.Shown(file.name) + ": " + std::string(StatusMessage(status)));
   }
   return output.Finish();

@@ -4,6 +4,7 @@
 #include <signal.h>
 #include <sys/resource.h>
 
+#include "catalog/thumbnail_file.h"
 #include "core/choice_lists.h"
 #include "core/data_folder.h"
 #include "platform/clock.h"
@@ -247,6 +248,34 @@ TEST_F(FileHistory, GrowsWithoutTouchingWhatItReserves) {
 #ifndef __SANITIZE_ADDRESS__  // the sanitizer keeps books of what is reserved, in memory of its own
   EXPECT_LT(after.ru_maxrss - before.ru_maxrss, 4 * 1024) << "kilobytes";
 #endif
+}
+
+TEST_F(FileHistory, SlotsHoldTheThumbnailsOfTheirFiles) {
+  settings.FileHistoryWindowType = choice::kLimitDays;
+  const auto put = [&](const std::string& name, uint8_t value) {
+    ThumbnailRecord record;
+    record.Fill(value * 0x010101u);
+    ASSERT_TRUE(WriteThumbnailFile(record, folder_.Path(name + ".THN")));
+  };
+  const auto shown = [&](size_t index) {
+    const ThumbnailRecord* const record = FileHistoryThumbnail(index);
+    return record == nullptr ? -1 : record->bytes[27911];
+  };
+  for (int i = 0; i < 130; ++i) {  // one time of growth
+    EXPECT_TRUE(Record(File("f" + std::to_string(i) + ".bmp"), 0, i));
+    if (i == 1) {
+      put("f0", 10);
+      put("f1", 11);
+    }
+    EXPECT_EQ(i < 1 ? 1011 : shown(0) * 100 + shown(1), 1011);
+  }
+  EXPECT_EQ(shown(2), -1);
+  put("f2", 12);
+  EXPECT_EQ(shown(2), 12);
+  EXPECT_TRUE(RemoveFromFileHistory(folder_.Path("f2.bmp")));
+  EXPECT_TRUE(Record(File("g.bmp"), 0, 0));  // in the free slot
+  EXPECT_EQ(FileHistoryAt(0).path, folder_.Path("g.bmp"));
+  EXPECT_EQ(shown(0), -1);
 }
 
 TEST_F(FileHistory, FaultsLoseNothingThatWasThere) {

@@ -237,6 +237,11 @@ TEST_F(ThumbsCommand, MakesWhatIsMissingAndCleansWhatIsLeft) {
   EXPECT_THAT(List(), ElementsAre("current a.bmp", "current b.bmp", "missing bad.bmp", "current c.bmp", "orphan gone.thn"));
   EXPECT_EQ(RunCommand({"thumbs", "make", In("a.bmp")}).out, "") << "it is there";
   EXPECT_NE(RunCommand({"thumbs", "make", In("a.bmp"), "--force"}).out, "");
+  const json elements = json::parse(RunCommand({"thumbs", "make", In(""), "--json"}).out);
+  ASSERT_EQ(elements.size(), 4u);
+  EXPECT_EQ(elements[0]["made"], false);
+  EXPECT_EQ(elements[0]["status"], 0);
+  EXPECT_EQ(elements[2], (json{{"file", In("bad.bmp")}, {"thumbnail", In("bad.THN")}, {"made", false}, {"status", 2}, {"message", "Damaged file."}}));
 
   EXPECT_EQ(RunCommand({"thumbs", "clean", In(""), "-n"}).out, In("gone.thn") + "\n");
   EXPECT_EQ(RunCommand({"thumbs", "clean", In("")}).status, 0);
