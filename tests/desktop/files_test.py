@@ -46,6 +46,28 @@ def rename_delete_undo_paste(folder):
         desktop.wait(r"lines=4 .*listing=0 .*folder=.*pictures$")
 
 
+def rename_in_sequence(folder):
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["a.bmp", "b.bmp", "c.bmp"])
+    with Desktop(folder, pictures, settings=["UpdateThumbnailsFlag=0"]) as desktop:
+        desktop.wait(r"lines=3 .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+a", "shift+F2")
+        desktop.wait(r"prompt sequential-rename")
+        desktop.focus("^Sequential Rename$")
+        desktop.key("ctrl+a")
+        desktop.type("beach")
+        desktop.screenshot("sequential-rename")
+        desktop.key("Return")
+        desktop.wait(r"batch ended")
+        desktop.wait(r"listed 3")
+        assert names(pictures) == ["beach0001.bmp", "beach0002.bmp", "beach0003.bmp"], names(pictures)
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+z")
+        desktop.wait(r"files Undo rename of 3 files done=3")
+        assert names(pictures) == ["a.bmp", "b.bmp", "c.bmp"], names(pictures)
+
+
 def thumbnails_and_session(folder):
     pictures = folder / "pictures"
     make_pictures(pictures, ["a.bmp", "b.bmp"])
@@ -69,4 +91,4 @@ def thumbnails_and_session(folder):
         desktop.wait(r"browser tabs=2 lines=2 .*listing=0 view=4 .*focus=b.bmp folder=.*pictures$")
 
 
-run(rename_delete_undo_paste, thumbnails_and_session)
+run(rename_delete_undo_paste, rename_in_sequence, thumbnails_and_session)

@@ -188,6 +188,8 @@ void BrowserPage::GoUp() {
 }
 
 void BrowserPage::StopListing() {
+  if (factsJob_ != nullptr) factsJob_->stop = true;
+  factsJob_.reset();
   if (job_ != nullptr) job_->stop = true;
   job_.reset();
 }
@@ -230,6 +232,7 @@ void BrowserPage::TakeListing(FolderListing listing, bool complete) {
   }
   if (complete) {
     Watch();
+    StartFacts();
     OfferThumbnails();
     wantedFocus_.clear();
     wantedScroll_ = -1;
@@ -244,6 +247,55 @@ void BrowserPage::Watch() {
   watcher_ = std::make_unique<wxFileSystemWatcher>();
   watcher_->SetOwner(this);
   watcher_->Add(wxFileName::DirName(wxString::FromUTF8(model_.Folder())));
+}
+
+// --- what only the files' headers tell ---
+
+bool BrowserPage::NeedsFacts() const {
+  const BrowserModes& modes = model_.Modes();
+  return modes.view == choice::kViewDetails || modes.sort == choice::kSortExifDate || modes.sort == choice::kSortDimensions;
+}
+
+void BrowserPage::StartFacts() {
+  constexpr size_t kGathered = 200;
+  if (listing_ || factsJob_ != nullptr || !NeedsFacts()) return;
+  std::vector<std::pair<size_t, FolderItem>> wanted;
+  for (size_t line = 0; line < model_.LineCount(); ++line) {
+    const size_t item = model_.ItemOfLine(line);
+    if (!model_.Item(item).folder && model_.Item(item).width == 0) wanted.emplace_back(item, model_.Item(item));
+  }
+  if (wanted.empty()) return;
+  factsJob_ = std::make_shared<Job>();
+  const auto tell = [this, weak = std::weak_ptr(factsJob_)](std::vector<std::pair<size_t, FolderItem>> facts, bool last) {
+    wxTheApp->CallAfter([this, weak, facts = std::move(facts), last] {
+      if (weak.lock() != nullptr) TakeFacts(facts, last);
+    });
+  };
+  std::thread([tell, job = factsJob_, folder = model_.Folder(), wanted = std::move(wanted)]() mutable {
+    std::vector<std::pair<size_t, FolderItem>> found;
+    for (auto& [item, facts] : wanted) {
+      if (job->stop) return;
+      AddPictureFacts(folder, facts);
+      if (facts.width > 0) found.emplace_back(item, std::move(facts));
+      if (found.size() == kGathered) tell(std::exchange(found, {}), false);
+    }
+    tell(std::move(found), true);
+  }).detach();
+}
+
+void BrowserPage::TakeFacts(const std::vector<std::pair<size_t, FolderItem>>& facts, bool last) {
+  for (const auto& [item, known] : facts) model_.SetFacts(item, known);
+  const int32_t sort = model_.Modes().sort;
+  const bool order = last && (sort == choice::kSortExifDate || sort == choice::kSortDimensions);
+  if (order) model_.UpdateOrder();
+  if (order) {
+    ShowView();
+  } else if (views_->GetSelection() == 1) {
+    details_->Refresh();
+  }
+  if (!last) return;
+  factsJob_.reset();
+  LogEvent("facts", model_.Folder());
 }
 
 // --- missing thumbnail files ---
@@ -327,6 +379,7 @@ void BrowserPage::ShowView() {
     canvas_->ShowLine(model_.Selected().Focus());
   }
   if (hadFocus) FocusList();
+  StartFacts();
 }
 
 void BrowserPage::SetViewMode(int32_t view) {
@@ -405,7 +458,7 @@ void BrowserPage::Activated() {
 
 void BrowserPage::ThumbnailsCame(const std::vector<ThumbnailLoader::Result>& results) {
   canvas_->ThumbnailsCame(results);
-  host_.BrowserChanged();
+  if (EventLogOn()) host_.BrowserChanged();
 }
 
 void BrowserPage::FocusList() {

@@ -80,6 +80,9 @@ class BrowserPage : public wxPanel {
   void StartListing();
   void StopListing();
   void TakeListing(FolderListing listing, bool complete);
+  void StartFacts();
+  void TakeFacts(const std::vector<std::pair<size_t, FolderItem>>& facts, bool last);
+  bool NeedsFacts() const;
   void ShowView();
   void ThumbnailsCame(const std::vector<ThumbnailLoader::Result>& results);
   void Activate(size_t line);
@@ -103,6 +106,7 @@ class BrowserPage : public wxPanel {
     std::atomic<bool> stop{false};
   };
   std::shared_ptr<Job> job_;  // of the latest listing
+  std::shared_ptr<Job> factsJob_;  // reads headers for columns and orders that need them
   std::unique_ptr<wxFileSystemWatcher> watcher_;
   wxTimer reloadTimer_;
   std::shared_ptr<ThumbnailOffer> offer_;  // of this folder

@@ -4,6 +4,7 @@
 #include "desktop/windows/batch_runner.h"
 #include "desktop/windows/file_actions.h"
 #include "desktop/windows/main_frame.h"
+#include "desktop/windows/sequential_rename_dialog.h"
 #include "desktop/windows/tool_windows.h"
 
 namespace fotomill::desktop {
@@ -19,6 +20,11 @@ void OfBrowser(MainFrame& frame) {
 template <int32_t view>
 void ShowAs(MainFrame& frame) {
   if (BrowserPage* browser = frame.Browser()) browser->SetViewMode(view);
+}
+
+template <int32_t mode>
+void ThumbnailsFrom(MainFrame& frame) {
+  if (BrowserPage* browser = frame.Browser()) browser->SetThumbnailMode(mode);
 }
 
 // Sorts by a mode; chosen again, the other way round.
@@ -99,6 +105,7 @@ constexpr Command kCommands[] = {
     {kEdit, "Copy pat&hs",         "Ctrl+Shift+C", "Puts the paths of the files on the clipboard as text.", Needs::Item, CopyPaths, nullptr, true},
     {kEdit, nullptr},
     {kEdit, "&Rename...",          "F2",           "Gives the focused file another name.", Needs::Item, OfBrowser<&BrowserPage::EditFocusedName>, nullptr, true},
+    {kEdit, "Rename in se&quence...", "Shift+F2",  "Numbers the selected files.", Needs::Files, RenameSelectionSequentially, "rename", true},
     {kEdit, nullptr},
     {kEdit, "Select &all",         "Ctrl+A",       "Selects all files that are shown.", Needs::Nothing, Select<&Selection::SelectAll>},
     {kEdit, "Select &none",        "Ctrl+Shift+A", "Selects nothing.", Needs::Nothing, Select<&Selection::SelectNone>},
@@ -119,6 +126,13 @@ constexpr Command kCommands[] = {
     {kView, "Sort by &type",       "",             "Sorts by type; again, the other way round.", Needs::Nothing, SortBy<choice::kSortType>},
     {kView, "Sort by si&ze",       "",             "Sorts by size; again, the other way round.", Needs::Nothing, SortBy<choice::kSortSize>},
     {kView, "Sort by d&ate",       "",             "Sorts by date; again, the other way round.", Needs::Nothing, SortBy<choice::kSortDate>},
+    {kView, "Sort by E&XIF date",  "",             "Sorts by the date on which pictures were taken; again, the other way round.", Needs::Nothing, SortBy<choice::kSortExifDate>},
+    {kView, "Sort by d&imensions", "",             "Sorts by the number of pixels; again, the other way round.", Needs::Nothing, SortBy<choice::kSortDimensions>},
+    {kView, nullptr},
+    {kView, "T&humbnails: disk-based", "",         "Thumbnails come from the files beside the pictures.", Needs::Nothing, ThumbnailsFrom<choice::kDiskBased>},
+    {kView, "Thumbnails: &virtual", "",            "Thumbnails are kept in memory only.", Needs::Nothing, ThumbnailsFrom<choice::kVirtual>},
+    {kView, "Thumbnails: glo&bal database", "",    "Thumbnails come from the database in the data folder.", Needs::Nothing, ThumbnailsFrom<choice::kGlobalDatabase>},
+    {kView, "Thumbnails: lo&cal database", "",     "Thumbnails come from the database in the folder.", Needs::Nothing, ThumbnailsFrom<choice::kLocalDatabase>},
     {kView, nullptr},
     {kView, "&Folders",            "F9",           "Shows or hides the folders at the left.", Needs::Nothing, ToggleFolders},
     {kView, "&Refresh",            "F5",           "Reads the folder again.", Needs::Nothing, OfBrowser<&BrowserPage::Reload>},

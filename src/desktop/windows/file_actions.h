@@ -33,6 +33,8 @@ class FileActions : public wxEvtHandler {
 
   void Undo();
   void Redo();
+  // Somebody else did it; it can be taken back like the rest.
+  void NoteDone(FileDeed deed) { undo_.Add(std::move(deed)); }
   const UndoList& Undoable() const { return undo_; }
   bool Busy() const { return busy_; }
   void Stop() { stop_ = true; }

@@ -7,10 +7,12 @@
 
 #include <algorithm>
 #include <cmath>
+#include <unordered_set>
 
 #include "core/choice_lists.h"
 #include "core/settings.h"
 #include "core/text.h"
+#include "desktop/event_log.h"
 #include "desktop/windows/bitmaps.h"
 #include "desktop/windows/wx_text.h"
 #include "picture/registry.h"
@@ -152,8 +154,12 @@ void ThumbnailCanvas::WantThumbnails() {
   thumbnails_.Want(std::move(wishes));
 }
 
-void ThumbnailCanvas::ThumbnailsCame(const std::vector<ThumbnailLoader::Result>&) {
-  Refresh();
+void ThumbnailCanvas::ThumbnailsCame(const std::vector<ThumbnailLoader::Result>& results) {
+  std::unordered_set<std::string> visible;
+  const CellLayout::Range range = layout_.Visible(scroll_);
+  for (size_t line = range.first; line < range.end; ++line) visible.insert(model_.PathOfLine(line));
+  const auto shows = [&](const ThumbnailLoader::Result& result) { return visible.contains(result.wish.path); };
+  if (std::any_of(results.begin(), results.end(), shows)) Refresh();
   if (thumbnails_.Pending() == 0) WantThumbnails();
 }
 
@@ -183,7 +189,19 @@ void ThumbnailCanvas::ScrollTo(int64_t scroll) {
 
 // --- drawing ---
 
+// Painting tells the log when the first one, and the first one with files, was done, and which ones were slow.
 void ThumbnailCanvas::OnPaint(wxPaintEvent&) {
+  constexpr double kFrame = 1.0 / 60;
+  const double start = platform::MonotonicSeconds();
+  Paint();
+  const double seconds = platform::MonotonicSeconds() - start;
+  const int stage = model_.LineCount() > 0 ? 2 : 1;
+  if (stage > painted_) LogEvent(stage == 2 ? "painted-files" : "painted", std::to_string(model_.LineCount()));
+  painted_ = std::max(painted_, stage);
+  if (seconds > kFrame) LogEvent("slow-paint", std::to_string(std::lround(seconds * 1000)) + " ms");
+}
+
+void ThumbnailCanvas::Paint() {
   wxPaintDC dc(this);
   const Looks looks;
   dc.SetBackground(wxBrush(looks.background));

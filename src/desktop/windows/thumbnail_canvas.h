@@ -49,6 +49,7 @@ class ThumbnailCanvas : public wxWindow {
  private:
   struct Looks;
   void OnPaint(wxPaintEvent&);
+  void Paint();
   void OnSize(wxSizeEvent&);
   void OnScroll(wxScrollWinEvent&);
   void OnWheel(wxMouseEvent&);
@@ -82,6 +83,7 @@ class ThumbnailCanvas : public wxWindow {
   int direction_ = 1;  // of scrolling: what is ahead is loaded first
   int square_ = 96;    // the picture's place in a cell, 0 where there is none
   int textHeight_ = 16;
+  int painted_ = 0;    // 1: anything, 2: files
 
   struct Drawn {
     ThumbnailPointer thumbnail;
