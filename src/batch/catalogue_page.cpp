@@ -139,6 +139,11 @@ class ContactSheet {
       if (outcome.status == Status::Ok) {
         outcome.status = status;
         outcome.destination = path;
+        if (status == Status::FunctionCancelled) {
+          outcome.status = Status::Ok;
+          outcome.skipped = true;
+          outcome.hint = "skipped, with its page.";
+        }
         if (status == Status::TooManyColors) outcome.hint = options_.reduceHint;
         if (status == Status::ErrorCreatingFile) outcome.hint = "\"" + path + "\" cannot be made.";
       }

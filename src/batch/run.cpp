@@ -21,6 +21,7 @@
 #include "platform/folders.h"
 #include "platform/paths.h"
 #include "platform/process.h"
+#include "platform/volumes.h"
 #include "processing/reduce.h"
 
 namespace fotomill {
@@ -207,7 +208,7 @@ class Batch {
       GiveBack(destination.path);
       const bool lostRace =
           status == Status::ErrorCreatingFile && !destination.replace && platform::IsRegularFile(destination.path);
-      if (!lostRace) return Failure(file, status, WriteHint(destination, status));
+      if (!lostRace) return Failure(file, status, WriteHint(destination, status, picture));
     }
     return Failure(file, Status::ErrorCreatingFile, std::string(kWriteAborted));
   }
@@ -330,11 +331,13 @@ class Batch {
     return UpperCase(job_.extension) + " cannot hold its " + lost.substr(2) + ".";
   }
 
-  std::string WriteHint(const Destination& destination, Status status) const {
+  std::string WriteHint(const Destination& destination, Status status, const PictureRecord& picture) const {
     if (status == Status::TooManyColors) return function_.reduce ? std::string() : function_.reduceHint;
-    if (status != Status::ErrorCreatingFile) return {};
     const std::string& path = destination.path;
     const std::string folder = FolderOf(path);
+    const bool full = status == Status::ErrorWritingFile && platform::FreeSpace(folder) < picture.image.Bytes().size();
+    if (full) return "There is hardly room left where it goes.";
+    if (status != Status::ErrorCreatingFile) return {};
     if (platform::IsFolder(path)) return "\"" + path + "\" is a folder.";
     if (!folder.empty() && !platform::IsFolder(folder)) return "There is no folder \"" + folder + "\".";
     if (destination.recycle && !platform::HasTrash(path)) return "\"" + path + "\" has no recycle bin to go to.";

@@ -101,12 +101,12 @@ int RunConvert(const ConvertOptions& options, const CommandContext& context) {
   if (options.quality > 0) settings.JpegCompression = settings.WebPQualityFactor = options.quality;
 
   ResultOutput output(context, options.json);
-  TerminalBox box(output, options.verbose, options.overwrite.empty());
   TerminalPrompts prompts(context, output);
   job.destinationFolder = options.dest;
-  job.box = &box;
   job.prompts = context.MayAsk() ? &prompts : nullptr;
   SetOverwritePolicy(options, context, job);
+  TerminalBox box(output, options.verbose, options.overwrite.empty() && !job.overwrite.prompt);
+  job.box = &box;
   if (const Status status = RunBatch(*files, FunctionOf(options), job); status != Status::Ok) {
     output.Message(output.ShownMessage(options.dest) + ": " + std::string(StatusMessage(status)));
     return kExitFailed;

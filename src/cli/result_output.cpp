@@ -74,6 +74,11 @@ void ResultOutput::ShowProgress(uint64_t done, uint64_t total) {
   progress_.Done(done);
 }
 
+void ResultOutput::Expect(uint64_t files) {
+  counts_ = true;
+  progress_.Begin(files);
+}
+
 void ResultOutput::MakeWay() {
   progress_.Clear();
   Deliver(true);
@@ -94,8 +99,13 @@ void ResultOutput::Element(const Json& element) {
   begun_ = true;
 }
 
-void ResultOutput::Failure(std::string_view name, Status status, std::string_view hint) {
+void ResultOutput::CountFile() {
   ++files_;
+  if (counts_) progress_.Done(files_);
+}
+
+void ResultOutput::Failure(std::string_view name, Status status, std::string_view hint) {
+  CountFile();
   ++failures_;
   std::string text = ShownMessage(name) + ": ";
   if (colored_) text += kRed;

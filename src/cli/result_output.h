@@ -41,7 +41,7 @@ class ResultOutput {
   // One element of the array. Only for JSON.
   void Element(const Json& element);
   // Counts a thing that was dealt with: the closing line tells how many there were.
-  void CountFile() { ++files_; }
+  void CountFile();
   // The message of a file that failed, "NAME: MESSAGE", with a hint behind it where there is one. Counts it as well.
   void Failure(std::string_view name, Status status, std::string_view hint = {});
   // A remark on the standard error that is no failure; left out by --quiet.
@@ -49,8 +49,9 @@ class ResultOutput {
   // A line on the standard error.
   void Message(std::string_view text);
 
-  // How far the command is, for who watches it on a terminal.
+  // How far the command is, for who watches it on a terminal: told each time, or counted by itself up to `files`.
   void ShowProgress(uint64_t done, uint64_t total);
+  void Expect(uint64_t files);
   // Time to tell the time again.
   void Tick() { progress_.Tick(); }
   // Everything printed so far is on its way, and the line of the progress is gone: before a question.
@@ -78,6 +79,7 @@ class ResultOutput {
   std::chrono::steady_clock::time_point delivered_;
   TerminalProgress progress_;
   uint64_t expected_ = 0;
+  bool counts_ = false;  // how far it is shows by the files that were counted
   uint64_t files_ = 0;
   uint64_t failures_ = 0;
 };

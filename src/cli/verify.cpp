@@ -40,6 +40,7 @@ int RunVerify(const VerifyOptions& options, const CommandContext& context) {
   const auto files = SelectFiles(options.selection, context);
   if (!files) return kExitUsage;
   ResultOutput output(context, options.json);
+  output.Expect(files->size());
   UsedFiles used(FileFunction::View);
   for (const SelectedFile& file : *files) {
     if (!output.GoesOn()) break;
