@@ -1,13 +1,14 @@
 #pragma once
 
 #include <span>
+#include <string>
 
 namespace fotomill::cli {
 
-// A library that the program is built with.
+// A library that the program is built with, or that it loads.
 struct Library {
   const char* name;
-  const char* version;
+  std::string version;
   const char* purpose;
 };
 

@@ -6,11 +6,11 @@
 //   "ICCP", "ANIM" background and loops, "ANMF" a frame, "ALPH" and "VP8 ", "EXIF", "XMP "
 //   ANMF: x / 2, y / 2, width - 1, height - 1, duration (3 bytes each), flags, then the frame's ALPH, VP8 or VP8L chunk
 //
-// Everything becomes 24 bits, with an alpha plane where the file has alpha. Of an animation the first frame is shown in its
-// place on the canvas, the rest of which is transparent. EXIF, XMP and ICC profile travel with the picture.
+// Everything becomes 24 bits, with an alpha plane where the file has alpha. Frames of an animation are its pages, each as it
+// stands on the canvas after those before it. EXIF, XMP and ICC profile travel with the picture.
 //
 // The writer makes lossy files of quality WebPQualityFactor, or lossless ones with WebPLossless, which keep every value,
-// also beneath transparent pixels.
+// also beneath transparent pixels. With WebPAllowMixed it makes both and keeps the smaller.
 // Source: RFC 9649 (2024).
 #include "formats/webp.h"
 
@@ -35,15 +35,23 @@ namespace {
 
 constexpr uint8_t kXmpFlag = 4, kExifFlag = 8, kAlphaFlag = 16, kIccFlag = 32;
 constexpr uint64_t kFileHead = 12, kFrameHead = 16;
+constexpr uint8_t kClearAfterwards = 1, kReplace = 2;  // flags of a frame: what becomes of it, and how it is put there
+constexpr size_t kMostFrames = 1 << 16;
+constexpr int kLossy = 1, kLossless = 2;               // WebPBitstreamFeatures::format
 constexpr std::string_view kExifHead("Exif\0\0", 6);  // some programs put it in front, as in JPEG
 
+struct WebpFrame {
+  int32_t left = 0, top = 0;  // on the canvas
+  int32_t width = 0, height = 0;
+  uint8_t flags = 0;
+  std::span<const uint8_t> pixels;  // what the library decodes: the whole file, or the frame's chunks
+};
+
 struct WebpFile {
-  int32_t width = 0, height = 0;             // of the canvas
-  int32_t left = 0, top = 0;                 // of the first frame on it
-  int32_t frameWidth = 0, frameHeight = 0;
-  int32_t frames = 0;                        // of an animation, else 0
+  int32_t width = 0, height = 0;  // of the canvas
   bool alpha = false;
-  std::span<const uint8_t> pixels;           // what the library decodes: the whole file, or the first frame's chunks
+  int format = 0;                 // of the library, 0 for an animation
+  std::vector<WebpFrame> frames;  // one of a still picture
   std::span<const uint8_t> icc, exif, xmp;
 };
 
@@ -70,12 +78,14 @@ Status StatusOf(VP8StatusCode code) {
 }
 
 void TakeFrame(std::span<const uint8_t> chunk, WebpFile& file) {
-  if (++file.frames > 1) return;
   ByteReader bytes(chunk);
-  file.left = static_cast<int32_t>(2 * Le24(bytes));
-  file.top = static_cast<int32_t>(2 * Le24(bytes));
-  bytes.Skip(kFrameHead - 6);
-  file.pixels = bytes.Take(bytes.Left());
+  WebpFrame frame;
+  frame.left = static_cast<int32_t>(2 * Le24(bytes));
+  frame.top = static_cast<int32_t>(2 * Le24(bytes));
+  bytes.Skip(kFrameHead - 7);
+  frame.flags = bytes.U8();
+  frame.pixels = bytes.Take(bytes.Left());
+  if (file.frames.size() < kMostFrames) file.frames.push_back(frame);
 }
 
 // The chunks beside the pixels. A chunk that is cut short is taken as far as it goes: the library tells what is missing.
@@ -95,28 +105,35 @@ void WalkChunks(std::span<const uint8_t> data, WebpFile& file) {
   }
 }
 
+// Asks the library for the size of an animation's frame, which must lie on the canvas.
+Status MeasureFrame(WebpFile& file, WebpFrame& frame) {
+  WebPBitstreamFeatures features;
+  RETURN_IF_BAD(StatusOf(WebPGetFeatures(frame.pixels.data(), frame.pixels.size(), &features)));
+  frame.width = features.width;
+  frame.height = features.height;
+  file.alpha = file.alpha || features.has_alpha != 0;
+  const bool inside = int64_t{frame.left} + frame.width <= file.width && int64_t{frame.top} + frame.height <= file.height;
+  return inside && features.has_animation == 0 ? Status::Ok : Status::DamagedFile;
+}
+
 Status ParseFile(std::span<const uint8_t> data, WebpFile& file) {
   if (data.size() < kFileHead) return Status::FileReadError;
   if (std::memcmp(data.data(), "RIFF", 4) != 0 || std::memcmp(data.data() + 8, "WEBP", 4) != 0) return Status::DamagedFile;
   WebPBitstreamFeatures features;
   RETURN_IF_BAD(StatusOf(WebPGetFeatures(data.data(), data.size(), &features)));
-  file.width = file.frameWidth = features.width;
-  file.height = file.frameHeight = features.height;
+  file.width = features.width;
+  file.height = features.height;
   file.alpha = features.has_alpha != 0;
-  file.pixels = data;
+  file.format = features.format;
   WalkChunks(data, file);
   if (features.has_animation == 0) {
-    file.pixels = data;
-    file.left = file.top = file.frames = 0;
+    file.frames.assign(1, {.width = file.width, .height = file.height, .flags = kReplace, .pixels = data});
     return Status::Ok;
   }
-  if (file.frames == 0) return Status::FileReadError;
-  RETURN_IF_BAD(StatusOf(WebPGetFeatures(file.pixels.data(), file.pixels.size(), &features)));
-  file.frameWidth = features.width;
-  file.frameHeight = features.height;
-  const bool inside = int64_t{file.left} + features.width <= file.width && int64_t{file.top} + features.height <= file.height;
-  if (!inside || features.has_animation != 0) return Status::DamagedFile;
-  file.alpha = file.alpha || features.has_alpha != 0 || file.frameWidth < file.width || file.frameHeight < file.height;
+  if (file.frames.empty()) return Status::FileReadError;
+  // What the frames leave open of the canvas is transparent; the first one tells.
+  RETURN_IF_BAD(MeasureFrame(file, file.frames[0]));
+  file.alpha = file.alpha || file.frames[0].width < file.width || file.frames[0].height < file.height;
   return Status::Ok;
 }
 
@@ -126,7 +143,11 @@ void Assign(std::vector<uint8_t>& block, std::span<const uint8_t> data) {
 }
 
 void Describe(const WebpFile& file, PictureRecord& picture) {
-  picture.typeName.AssignCut(file.frames > 1 ? "Animated WebP" : "WebP");
+  picture.typeName.AssignCut(file.frames.size() > 1      ? "Animated WebP"
+                             : file.format == kLossless ? "WebP, lossless"
+                             : file.format == kLossy    ? "WebP, lossy"
+                                                        : "WebP");
+  picture.pageCount = static_cast<int32_t>(file.frames.size());
   picture.width = file.width;
   picture.height = file.height;
   picture.bitsPerPixel = 24;
@@ -144,28 +165,67 @@ struct WebpTarget {
   PackedImage image, alpha;
 };
 
-// With alpha, the frame is decoded to four bytes a pixel and put in its place.
-Status ReadWithAlpha(const WebpFile& file, const PictureRecord& picture, WebpTarget& target) {
-  const size_t stride = 4 * static_cast<size_t>(file.frameWidth);
-  platform::MemoryBlock frame;
-  if (!frame.Allocate(stride * static_cast<size_t>(file.frameHeight), platform::Fill::Unset)) return Status::MemoryAllocationError;
+// Puts a row of a frame onto the canvas: in the place of what is there, or over it.
+void PutRow(const uint8_t* source, int32_t width, bool replace, uint8_t* color, uint8_t* alpha) {
+  for (int32_t x = 0; x < width; ++x, source += 4, color += 3, ++alpha) {
+    const uint32_t over = source[3], under = *alpha * (255 - over) / 255;
+    if (replace || over == 255 || over + under == 0) {
+      std::memcpy(color, source, 3);
+      *alpha = source[3];
+    } else if (over > 0) {
+      for (size_t i = 0; i < 3; ++i) {
+        color[i] = static_cast<uint8_t>((source[i] * over + color[i] * under + (over + under) / 2) / (over + under));
+      }
+      *alpha = static_cast<uint8_t>(over + under);
+    }
+  }
+}
+
+void ClearFrame(const WebpFrame& frame, WebpTarget& target) {
+  for (int32_t y = frame.top; y < frame.top + frame.height; ++y) {
+    std::fill_n(target.image.Row(y).data() + 3 * static_cast<size_t>(frame.left), 3 * static_cast<size_t>(frame.width), uint8_t{0});
+    std::fill_n(target.alpha.Row(y).data() + frame.left, frame.width, uint8_t{0});
+  }
+}
+
+// With alpha, a frame is decoded to four bytes a pixel and put in its place.
+Status ReadFrame(const WebpFrame& frame, const PictureRecord& picture, WebpTarget& target) {
+  const size_t stride = 4 * static_cast<size_t>(frame.width);
+  platform::MemoryBlock decoded;
+  if (!decoded.Allocate(stride * static_cast<size_t>(frame.height), platform::Fill::Unset)) return Status::MemoryAllocationError;
   WebPDecoderConfig config;
   if (WebPInitDecoderConfig(&config) == 0) return Status::MemoryAllocationError;
   config.output.colorspace = MODE_BGRA;
   config.output.is_external_memory = 1;
-  config.output.u.RGBA = {frame.Data(), static_cast<int>(stride), frame.Size()};
-  RETURN_IF_BAD(StatusOf(WebPDecode(file.pixels.data(), file.pixels.size(), &config)));
-  for (int32_t y = 0; y < file.frameHeight; ++y) {
-    const uint8_t* source = frame.Data() + stride * static_cast<size_t>(y);
-    uint8_t* color = target.image.Row(file.top + y).data() + 3 * static_cast<size_t>(file.left);
-    uint8_t* alpha = target.alpha.Row(file.top + y).data() + file.left;
-    for (int32_t x = 0; x < file.frameWidth; ++x, source += 4, color += 3) {
-      std::memcpy(color, source, 3);
-      alpha[x] = source[3];
-    }
-    picture.ReportRow(file.top + y);
+  config.output.u.RGBA = {decoded.Data(), static_cast<int>(stride), decoded.Size()};
+  RETURN_IF_BAD(StatusOf(WebPDecode(frame.pixels.data(), frame.pixels.size(), &config)));
+  for (int32_t y = 0; y < frame.height; ++y) {
+    PutRow(decoded.Data() + stride * static_cast<size_t>(y), frame.width, (frame.flags & kReplace) != 0,
+           target.image.Row(frame.top + y).data() + 3 * static_cast<size_t>(frame.left),
+           target.alpha.Row(frame.top + y).data() + frame.left);
+    picture.ReportRow(frame.top + y);
   }
   return Status::Ok;
+}
+
+// The canvas as it is with frame `page` on it.
+Status ReadWithAlpha(WebpFile& file, const PictureRecord& picture, WebpTarget& target) {
+  for (size_t i = 0; i <= static_cast<size_t>(picture.page); ++i) {
+    WebpFrame& frame = file.frames[i];
+    if (frame.width == 0) RETURN_IF_BAD(MeasureFrame(file, frame));
+    if (i > 0 && (file.frames[i - 1].flags & kClearAfterwards) != 0) ClearFrame(file.frames[i - 1], target);
+    RETURN_IF_BAD(ReadFrame(frame, picture, target));
+  }
+  return Status::Ok;
+}
+
+// An animation that does not tell of alpha may have it all the same; mostly it has not.
+void DropOpaqueAlpha(WebpTarget& target) {
+  for (int32_t y = 0; y < target.alpha.Height(); ++y) {
+    const uint8_t* row = target.alpha.Row(y).data();
+    if (std::any_of(row, row + target.alpha.Width(), [](uint8_t alpha) { return alpha != 255; })) return;
+  }
+  target.alpha.Free();
 }
 
 // Without alpha the library fills the picture's own rows, which are stored bottom row first.
@@ -176,7 +236,7 @@ Status ReadOpaque(const WebpFile& file, const PictureRecord& picture, WebpTarget
   config.output.is_external_memory = 1;
   config.options.flip = 1;
   config.output.u.RGBA = {target.image.Rows().data(), static_cast<int>(target.image.Stride()), target.image.Rows().size()};
-  RETURN_IF_BAD(StatusOf(WebPDecode(file.pixels.data(), file.pixels.size(), &config)));
+  RETURN_IF_BAD(StatusOf(WebPDecode(file.frames[0].pixels.data(), file.frames[0].pixels.size(), &config)));
   for (int32_t y = 0; y < file.height; ++y) picture.ReportRow(y);
   return Status::Ok;
 }
@@ -198,10 +258,9 @@ void FillRow(const PictureRecord& picture, int32_t y, uint32_t* target) {
   }
 }
 
-Status Encode(const PictureRecord& picture, WebPMemoryWriter& encoded) {
+Status Encode(const PictureRecord& picture, bool lossless, WebPMemoryWriter& encoded) {
   WebPConfig config;
   WebPPicture source;
-  const bool lossless = settings.WebPLossless != 0;
   const auto quality = static_cast<float>(std::clamp<int32_t>(settings.WebPQualityFactor, 0, 100));
   if (WebPConfigPreset(&config, WEBP_PRESET_DEFAULT, quality) == 0 || WebPPictureInit(&source) == 0) return Status::ResourceError;
   config.lossless = lossless ? 1 : 0;
@@ -287,11 +346,14 @@ Status WebpRead(PictureRecord& picture, const char* fileName) {
   WebpFile file;
   RETURN_IF_BAD(ParseFile(view.Bytes(), file));
   Describe(file, picture);
+  if (picture.page < 0 || picture.page >= picture.pageCount) return Status::NoImages;
+  const bool canvas = file.alpha || file.frames.size() > 1;
   WebpTarget target;
   RETURN_IF_BAD(NewPackedImage(file.width, file.height, &picture.palette, 24, target.image));
-  if (file.alpha) RETURN_IF_BAD(NewAlphaPlane(file.width, file.height, target.alpha));
-  RETURN_IF_BAD(file.alpha ? ReadWithAlpha(file, picture, target) : ReadOpaque(file, picture, target));
+  if (canvas) RETURN_IF_BAD(NewAlphaPlane(file.width, file.height, target.alpha));
+  RETURN_IF_BAD(canvas ? ReadWithAlpha(file, picture, target) : ReadOpaque(file, picture, target));
   if (!view.Intact()) return Status::FileReadError;
+  if (canvas && !file.alpha) DropOpaqueAlpha(target);
   picture.image = std::move(target.image);
   picture.alpha = std::move(target.alpha);
   return Status::Ok;
@@ -303,9 +365,13 @@ Status WebpWrite(PictureRecord& picture, const WriteOptions& options) {
   if (picture.image.Width() > WEBP_MAX_DIMENSION || picture.image.Height() > WEBP_MAX_DIMENSION) return Status::UnsuitableImage;
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
-  EncodedFile encoded;
-  RETURN_IF_BAD(Encode(picture, encoded.writer));
-  const std::span<const uint8_t> bytes(encoded.writer.mem, encoded.writer.size);
+  const bool lossless = settings.WebPLossless != 0;
+  EncodedFile encoded, other;
+  RETURN_IF_BAD(Encode(picture, lossless, encoded.writer));
+  if (settings.WebPAllowMixed != 0) RETURN_IF_BAD(Encode(picture, !lossless, other.writer));
+  const bool useOther = other.writer.size > 0 && other.writer.size < encoded.writer.size;
+  const WebPMemoryWriter& chosen = useOther ? other.writer : encoded.writer;
+  const std::span<const uint8_t> bytes(chosen.mem, chosen.size);
   const bool keep = options.keepMetadata && settings.PreserveEXIF != 0 && !picture.metadata.Empty();
   if (keep && bytes.size() > kFileHead) {
     WriteFile(out, picture, bytes);

@@ -6,7 +6,8 @@
 namespace fotomill {
 
 // WebP. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when the file ends before its pixels,
-// MemoryAllocationError (6), UnsupportedFormat (8). Of an animation, the first frame is read.
+// MemoryAllocationError (6), UnsupportedFormat (8), NoImages (20) for a frame that is not there. Frames of an animation are
+// pages.
 Status WebpInfo(PictureRecord& picture, const char* fileName, uint32_t flags);
 Status WebpRead(PictureRecord& picture, const char* fileName);
 // Also UnsuitableImage (13) for sides over 16383, ErrorCreatingFile (10), ErrorWritingFile (11).

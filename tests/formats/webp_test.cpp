@@ -2,8 +2,12 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <cstdio>
+
 #include "core/settings.h"
 #include "support/codecs.h"
+#include "support/files.h"
 #include "support/scoped_settings.h"
 
 namespace fotomill::test {
@@ -51,6 +55,48 @@ TEST(Webp, MetadataTravels) {
     EXPECT_EQ(back.picture->alpha.Empty(), !alpha);
     settings.PreserveEXIF = 0;
     EXPECT_TRUE(Decode(WebpRead, Encode(WebpWrite, *picture)).picture->metadata.Empty());
+  }
+}
+
+TEST(Webp, FramesAreDrawnOverEachOther) {
+  const std::vector<uint8_t> replacing = ReadBytes(SourcePath("tests/formats/webp/good/frames.webp"));
+  std::vector<uint8_t> blending = replacing;
+  constexpr std::string_view kFrame = "ANMF";
+  for (auto at = blending.begin(); at != blending.end();) {
+    at = std::search(at, blending.end(), kFrame.begin(), kFrame.end());
+    if (at != blending.end()) *(at += 23) = 0;  // its flags
+  }
+  struct Row {
+    const std::vector<uint8_t>& file;
+    int32_t page;
+    Status status;
+    const char *left, *middle, *right;  // 3, 12 and 20 from the left: alpha and colour
+  };
+  const Row rows[] = {
+      {replacing, 0, Status::Ok, "255 ff0000", "255 ff0000", "0 000000"},
+      {replacing, 1, Status::Ok, "0 000000", "195 ff5000", "0 000000"},
+      {blending, 1, Status::Ok, "255 ff0000", "255 ff3d00", "0 000000"},
+      {replacing, 2, Status::Ok, "0 000000", "135 ffa000", "135 ffa000"},
+      {replacing, 3, Status::NoImages, "", "", ""},
+  };
+  const TemporaryFolder folder;
+  for (const Row& row : rows) {
+    SCOPED_TRACE(row.page);
+    WriteBytes(folder.Path("a.webp"), row.file);
+    const PicturePointer picture = NewPictureRecord();
+    picture->page = row.page;
+    ASSERT_EQ(WebpRead(*picture, folder.Path("a.webp").c_str()), row.status);
+    EXPECT_EQ(picture->pageCount, 3);
+    if (row.status != Status::Ok) continue;
+    const auto at = [&](int32_t x) {
+      char text[24];
+      const int32_t alpha = picture->alpha.PixelAt(x, 5);
+      std::snprintf(text, sizeof text, "%d %06x", alpha, alpha == 0 ? 0 : picture->image.PixelAt(x, 5));
+      return std::string(text);
+    };
+    EXPECT_EQ(at(3), row.left);
+    EXPECT_EQ(at(12), row.middle);
+    EXPECT_EQ(at(20), row.right);
   }
 }
 
