@@ -1,4 +1,4 @@
-// Portable Network Graphics (PNG), big-endian, decoded and encoded by libpng.
+// Portable Network Graphics (PNG), big-endian; png_write.cpp writes.
 //
 //   signature 89 50 4E 47 0D 0A 1A 0A, then chunks of length, type, data and CRC:
 //   IHDR  width, height (4 bytes each), bit depth, colour type (1 colour, 2 palette bit, 4 alpha), 0, 0, interlace
@@ -9,12 +9,10 @@
 // colour. 16-bit samples are rounded to 8. Gamma is told, not applied. Of an animation (acTL) the default picture is shown.
 // EXIF, XMP, ICC profile and resolution travel with the picture.
 //
-// The writer keeps the depth: palettes of 1, 4 and 8 bits (greys as grey), RGB, or RGBA with an alpha plane, compressed as
-// PngCompression says.
+// libpng reads everything in front of the pixels. Pixels that are not interlaced are inflated by libdeflate as a whole and
+// unfiltered here, which takes half the time; interlaced ones, rare forms and whatever looks damaged are libpng's.
 // Source: W3C, "Portable Network Graphics (PNG) Specification (Third Edition)", 2025; libpng manual.
 #include "formats/png.h"
-
-#include <png.h>
 
 #include <algorithm>
 #include <cmath>
@@ -23,37 +21,24 @@
 #include <vector>
 
 #include "core/byte_reader.h"
-#include "core/byte_writer.h"
 #include "core/limits.h"
 #include "core/settings.h"
 #include "formats/png_chunks.h"
+#include "formats/png_library.h"
+#include "formats/png_pixels.h"
 #include "platform/file_view.h"
 
 namespace fotomill {
 
 namespace {
 
-constexpr char kXmpKeyword[] = "XML:com.adobe.xmp";
-constexpr double kInchesPerMetre = 39.3701;
 constexpr png_uint_32 kMostSide = 0x7fffffff;
 constexpr png_alloc_size_t kMostChunkMemory = 64u << 20;
 
-// The library's errors end here: they are told by the status, never printed.
-[[noreturn]] void OnError(png_structp png, png_const_charp) { png_longjmp(png, 1); }
-void OnWarning(png_structp, png_const_charp) {}
-
-// Runs library calls; false when one of them failed. Nothing with a destructor may live inside `action`.
-template <typename Action>
-bool Guarded(png_structp png, Action action) {
-  if (setjmp(png_jmpbuf(png)) != 0) return false;
-  action();
-  return true;
-}
-
 // A file being read, with the library's two structures.
 struct PngReader {
-  explicit PngReader(std::span<const uint8_t> file) : bytes(file) {
-    png = png_create_read_struct(PNG_LIBPNG_VER_STRING, nullptr, OnError, OnWarning);
+  explicit PngReader(std::span<const uint8_t> data) : file(data), bytes(data) {
+    png = png_create_read_struct(PNG_LIBPNG_VER_STRING, nullptr, OnPngError, OnPngWarning);
     if (png != nullptr) info = png_create_info_struct(png);
   }
   ~PngReader() { png_destroy_read_struct(&png, &info, nullptr); }
@@ -63,6 +48,7 @@ struct PngReader {
   // What a failed library call means.
   Status Failure() const { return bytes.Ok() ? Status::DamagedFile : Status::FileReadError; }
 
+  std::span<const uint8_t> file;
   ByteReader bytes;
   png_structp png = nullptr;
   png_infop info = nullptr;
@@ -76,7 +62,7 @@ void ReadBytes(png_structp png, png_bytep target, size_t count) {
 }
 
 // How the rows come out of the library.
-enum class PngRows {
+enum class RowForm {
   Direct,    // as the picture stores them
   TwoBits,   // one index a byte, to be packed into 4 bits
   WithAlpha  // blue, green, red, alpha
@@ -86,14 +72,14 @@ struct PngLayout {
   int32_t width = 0, height = 0;
   int32_t bitsPerPixel = 0;
   bool interlaced = false;
-  PngRows rows = PngRows::Direct;
+  RowForm rows = RowForm::Direct;
 };
 
 // Reads everything before the pixels and sets up the conversions.
 Status ReadHeader(PngReader& reader) {
   if (!reader.Ready()) return Status::MemoryAllocationError;
   if (png_sig_cmp(reader.bytes.Peek(8).data(), 0, reader.bytes.Peek(8).size()) != 0) return Status::DamagedFile;
-  const bool read = Guarded(reader.png, [&] {
+  const bool read = PngGuarded(reader.png, [&] {
     png_set_read_fn(reader.png, &reader, ReadBytes);
     png_set_user_limits(reader.png, kMostSide, kMostSide);
     png_set_chunk_malloc_max(reader.png, kMostChunkMemory);
@@ -112,20 +98,20 @@ PngLayout ChooseLayout(const PngReader& reader) {
   layout.height = static_cast<int32_t>(png_get_image_height(reader.png, reader.info));
   layout.interlaced = png_get_interlace_type(reader.png, reader.info) != PNG_INTERLACE_NONE;
   layout.bitsPerPixel = indexed && !transparent ? std::min<int32_t>(depth, 8) : 24;
-  layout.rows = transparent                  ? PngRows::WithAlpha
-                : layout.bitsPerPixel == 2   ? PngRows::TwoBits
-                                             : PngRows::Direct;
+  layout.rows = transparent                  ? RowForm::WithAlpha
+                : layout.bitsPerPixel == 2   ? RowForm::TwoBits
+                                             : RowForm::Direct;
   return layout;
 }
 
 void SetConversions(const PngReader& reader, const PngLayout& layout) {
   png_set_scale_16(reader.png);
-  if (layout.rows == PngRows::TwoBits) png_set_packing(reader.png);
+  if (layout.rows == RowForm::TwoBits) png_set_packing(reader.png);
   if (layout.bitsPerPixel == 24) {
     png_set_expand(reader.png);
     png_set_gray_to_rgb(reader.png);
     png_set_bgr(reader.png);
-    if (layout.rows == PngRows::WithAlpha) png_set_add_alpha(reader.png, 255, PNG_FILLER_AFTER);
+    if (layout.rows == RowForm::WithAlpha) png_set_add_alpha(reader.png, 255, PNG_FILLER_AFTER);
   }
   png_set_interlace_handling(reader.png);
   png_read_update_info(reader.png, reader.info);
@@ -165,7 +151,7 @@ void TakeTexts(const PngReader& reader, PictureRecord& picture) {
   for (int i = 0; i < count; ++i) {
     const size_t size = std::max(texts[i].text_length, texts[i].itxt_length);
     const auto* text = reinterpret_cast<const uint8_t*>(texts[i].text);
-    if (std::strcmp(texts[i].key, kXmpKeyword) == 0) Assign(picture.metadata.xmp, text, size);
+    if (std::strcmp(texts[i].key, kPngXmpKeyword) == 0) Assign(picture.metadata.xmp, text, size);
     if (std::strcmp(texts[i].key, "Comment") == 0) Assign(picture.comment, text, size);
   }
 }
@@ -186,8 +172,8 @@ void TakeMetadata(const PngReader& reader, PictureRecord& picture) {
   png_uint_32 x = 0, y = 0;
   int unit = 0;
   if (png_get_pHYs(reader.png, reader.info, &x, &y, &unit) != 0 && unit == PNG_RESOLUTION_METER) {
-    picture.metadata.dpiX = x / kInchesPerMetre;
-    picture.metadata.dpiY = y / kInchesPerMetre;
+    picture.metadata.dpiX = x / kPngInchesPerMetre;
+    picture.metadata.dpiY = y / kPngInchesPerMetre;
   }
 }
 
@@ -210,7 +196,7 @@ Status Describe(PngReader& reader, std::span<const uint8_t> file, PngLayout& lay
   picture.width = layout.width;
   picture.height = layout.height;
   picture.bitsPerPixel = layout.bitsPerPixel;
-  const bool alpha = layout.rows == PngRows::WithAlpha;
+  const bool alpha = layout.rows == RowForm::WithAlpha;
   picture.alphaFlags = static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (alpha ? kHasAlpha : 0));
   picture.imageBytes = EstimateImageBytes(layout.width, layout.height, layout.bitsPerPixel);
   TakePalette(reader, layout, picture.palette);
@@ -238,7 +224,7 @@ struct PngTarget {
 };
 
 void StoreRow(const PngLayout& layout, const uint8_t* source, int32_t y, PngTarget& target) {
-  if (layout.rows == PngRows::WithAlpha) {
+  if (layout.rows == RowForm::WithAlpha) {
     SplitAlpha(source, target.image.Row(y).data(), target.alpha.Row(y).data(), layout.width);
   } else {
     PackNibbles(source, target.image.Row(y).data(), layout.width);
@@ -248,9 +234,9 @@ void StoreRow(const PngLayout& layout, const uint8_t* source, int32_t y, PngTarg
 // Rows that come in order: straight into the picture, or through one row.
 Status ReadInOrder(PngReader& reader, const PngLayout& layout, const PictureRecord& picture, PngTarget& target) {
   std::vector<uint8_t> row(png_get_rowbytes(reader.png, reader.info));
-  const bool read = Guarded(reader.png, [&] {
+  const bool read = PngGuarded(reader.png, [&] {
     for (int32_t y = 0; y < layout.height; ++y) {
-      const bool direct = layout.rows == PngRows::Direct;
+      const bool direct = layout.rows == RowForm::Direct;
       png_read_row(reader.png, direct ? target.image.Row(y).data() : row.data(), nullptr);
       if (!direct) StoreRow(layout, row.data(), y, target);
       picture.ReportRow(y);
@@ -263,13 +249,13 @@ Status ReadInOrder(PngReader& reader, const PngLayout& layout, const PictureReco
 Status ReadInterlaced(PngReader& reader, const PngLayout& layout, const PictureRecord& picture, PngTarget& target) {
   const uint64_t rowBytes = png_get_rowbytes(reader.png, reader.info);
   platform::MemoryBlock buffer;
-  if (layout.rows != PngRows::Direct && !buffer.Allocate(rowBytes * static_cast<uint64_t>(layout.height))) {
+  if (layout.rows != RowForm::Direct && !buffer.Allocate(rowBytes * static_cast<uint64_t>(layout.height))) {
     return Status::MemoryAllocationError;
   }
   const auto rowAt = [&](int32_t y) {
     return buffer.Empty() ? target.image.Row(y).data() : buffer.Data() + rowBytes * static_cast<uint64_t>(y);
   };
-  const bool read = Guarded(reader.png, [&] {
+  const bool read = PngGuarded(reader.png, [&] {
     constexpr int kPasses = 7;
     for (int pass = 0; pass < kPasses; ++pass) {
       for (int32_t y = 0; y < layout.height; ++y) png_read_row(reader.png, rowAt(y), nullptr);
@@ -284,134 +270,115 @@ Status ReadInterlaced(PngReader& reader, const PngLayout& layout, const PictureR
   return Status::Ok;
 }
 
+// How a whole row of the file, free of its filter, becomes the picture's.
+using StoreFileRow = void (*)(const uint8_t* source, size_t width, const PngReader& reader, uint8_t* image, uint8_t* alpha);
+
+uint8_t HighByte(const uint8_t* sample) { return static_cast<uint8_t>(((sample[0] << 8 | sample[1]) * 255u + 32895) >> 16); }
+
+template <int kBits>
+void CopyPixels(const uint8_t* source, size_t width, const PngReader&, uint8_t* image, uint8_t*) {
+  std::memcpy(image, source, (width * kBits + 7) / 8);
+}
+
+template <size_t kSamples, size_t kBytes>  // grey or colours, with alpha when the number is even; samples of one or two bytes
+void StoreSamples(const uint8_t* source, size_t width, const PngReader&, uint8_t* image, uint8_t* alpha) {
+  const auto sample = [](const uint8_t* at) { return kBytes == 1 ? *at : HighByte(at); };
+  constexpr size_t kColors = kSamples < 3 ? 1 : 3;
+  for (size_t x = 0; x < width; ++x, source += kSamples * kBytes, image += 3) {
+    image[0] = sample(source + (kColors - 1) * kBytes);
+    image[1] = sample(source + (kColors - 1) / 2 * kBytes);
+    image[2] = sample(source);
+    if constexpr (kSamples % 2 == 0) alpha[x] = sample(source + kColors * kBytes);
+  }
+}
+
+void StoreDeepGreys(const uint8_t* source, size_t width, const PngReader&, uint8_t* image, uint8_t*) {
+  for (size_t x = 0; x < width; ++x) image[x] = HighByte(source + 2 * x);
+}
+
+// Colours of a palette with alpha.
+void StorePaletteAlpha(const uint8_t* source, size_t width, const PngReader& reader, uint8_t* image, uint8_t* alpha) {
+  png_bytep opacities = nullptr;
+  png_colorp colors = nullptr;
+  int opacityCount = 0, count = 0;
+  png_get_tRNS(reader.png, reader.info, &opacities, &opacityCount, nullptr);
+  png_get_PLTE(reader.png, reader.info, &colors, &count);
+  for (size_t x = 0; x < width; ++x, image += 3) {
+    const int index = source[x];
+    const png_color color = index < count ? colors[index] : png_color{};
+    image[0] = color.blue;
+    image[1] = color.green;
+    image[2] = color.red;
+    alpha[x] = index < opacityCount ? opacities[index] : uint8_t{255};
+  }
+}
+
+// The forms that are worth a way of their own; the library takes the rest.
+StoreFileRow FileRowStore(const PngReader& reader, const PngLayout& layout) {
+  struct Form {
+    int type, depth;
+    bool transparentColor;
+    StoreFileRow store;
+  };
+  constexpr Form kForms[] = {
+      {PNG_COLOR_TYPE_GRAY, 1, false, CopyPixels<1>},
+      {PNG_COLOR_TYPE_GRAY, 4, false, CopyPixels<4>},
+      {PNG_COLOR_TYPE_GRAY, 8, false, CopyPixels<8>},
+      {PNG_COLOR_TYPE_GRAY, 16, false, StoreDeepGreys},
+      {PNG_COLOR_TYPE_PALETTE, 1, false, CopyPixels<1>},
+      {PNG_COLOR_TYPE_PALETTE, 4, false, CopyPixels<4>},
+      {PNG_COLOR_TYPE_PALETTE, 8, false, CopyPixels<8>},
+      {PNG_COLOR_TYPE_PALETTE, 8, true, StorePaletteAlpha},
+      {PNG_COLOR_TYPE_GRAY_ALPHA, 8, false, StoreSamples<2, 1>},
+      {PNG_COLOR_TYPE_GRAY_ALPHA, 16, false, StoreSamples<2, 2>},
+      {PNG_COLOR_TYPE_RGB, 8, false, StoreSamples<3, 1>},
+      {PNG_COLOR_TYPE_RGB, 16, false, StoreSamples<3, 2>},
+      {PNG_COLOR_TYPE_RGB_ALPHA, 8, false, StoreSamples<4, 1>},
+      {PNG_COLOR_TYPE_RGB_ALPHA, 16, false, StoreSamples<4, 2>},
+  };
+  const bool transparentColor = png_get_valid(reader.png, reader.info, PNG_INFO_tRNS) != 0;
+  for (const Form& form : kForms) {
+    const bool matches = form.type == png_get_color_type(reader.png, reader.info) &&
+                         form.depth == png_get_bit_depth(reader.png, reader.info) && form.transparentColor == transparentColor;
+    if (matches && !layout.interlaced) return form.store;
+  }
+  return nullptr;
+}
+
+// All rows, inflated at once. False, with the target in any state, when the library has to try.
+bool ReadAtOnce(const PngReader& reader, const PngLayout& layout, const PictureRecord& picture, PngTarget& target) {
+  const StoreFileRow store = FileRowStore(reader, layout);
+  if (store == nullptr) return false;
+  const uint32_t pixelBits = uint32_t{png_get_bit_depth(reader.png, reader.info)} * png_get_channels(reader.png, reader.info);
+  const uint64_t rowBytes = (static_cast<uint64_t>(layout.width) * pixelBits + 7) / 8;
+  PngPixels pixels;
+  if (!pixels.Inflate(reader.file, rowBytes, pixelBits, layout.height)) return false;
+  for (int32_t y = 0; y < layout.height; ++y) {
+    const uint8_t* row = pixels.NextRow();
+    if (row == nullptr) return false;
+    store(row, static_cast<size_t>(layout.width), reader, target.image.Row(y).data(),
+          target.alpha.Empty() ? nullptr : target.alpha.Row(y).data());
+    picture.ReportRow(y);
+  }
+  return true;
+}
+
 Status ReadPixels(PngReader& reader, const PngLayout& layout, PictureRecord& picture) {
   PngTarget target;
   RETURN_IF_BAD(NewPackedImage(layout.width, layout.height, &picture.palette, layout.bitsPerPixel, target.image));
-  if (layout.rows == PngRows::WithAlpha) RETURN_IF_BAD(NewAlphaPlane(layout.width, layout.height, target.alpha));
+  if (layout.rows == RowForm::WithAlpha) RETURN_IF_BAD(NewAlphaPlane(layout.width, layout.height, target.alpha));
+  if (ReadAtOnce(reader, layout, picture, target)) {
+    picture.image = std::move(target.image);
+    picture.alpha = std::move(target.alpha);
+    return Status::Ok;
+  }
   // Only now: the library takes memory for rows of whatever width the file claims.
-  if (!Guarded(reader.png, [&] { SetConversions(reader, layout); })) return reader.Failure();
+  if (!PngGuarded(reader.png, [&] { SetConversions(reader, layout); })) return reader.Failure();
   RETURN_IF_BAD(layout.interlaced ? ReadInterlaced(reader, layout, picture, target)
                                   : ReadInOrder(reader, layout, picture, target));
   picture.image = std::move(target.image);
   picture.alpha = std::move(target.alpha);
   return Status::Ok;
-}
-
-// A file being written.
-struct PngWriter {
-  explicit PngWriter(ByteWriter& target) : out(target) {
-    png = png_create_write_struct(PNG_LIBPNG_VER_STRING, nullptr, OnError, OnWarning);
-    if (png != nullptr) info = png_create_info_struct(png);
-  }
-  ~PngWriter() { png_destroy_write_struct(&png, &info); }
-  PngWriter(const PngWriter&) = delete;
-  PngWriter& operator=(const PngWriter&) = delete;
-  bool Ready() const { return info != nullptr; }
-
-  ByteWriter& out;
-  png_structp png = nullptr;
-  png_infop info = nullptr;
-};
-
-void WriteBytes(png_structp png, png_bytep bytes, size_t count) {
-  static_cast<PngWriter*>(png_get_io_ptr(png))->out.Bytes({bytes, count});
-}
-void FlushNothing(png_structp) {}
-
-// Whether the palette is the grey ramp of its depth.
-bool IsGrey(const Palette& palette, int32_t bits) {
-  const int levels = 1 << bits;
-  for (int i = 0; i < 3 * levels; ++i) {
-    if (palette[static_cast<size_t>(i)] != i / 3 * 255 / (levels - 1)) return false;
-  }
-  return true;
-}
-
-int ColorType(const PictureRecord& picture) {
-  const int32_t bits = picture.image.Bits();
-  if (bits == 24) return picture.alpha.Empty() ? PNG_COLOR_TYPE_RGB : PNG_COLOR_TYPE_RGB_ALPHA;
-  return IsGrey(picture.palette, bits) ? PNG_COLOR_TYPE_GRAY : PNG_COLOR_TYPE_PALETTE;
-}
-
-void SetMetadata(const PngWriter& writer, const PictureRecord& picture, bool keep, uint8_t& lost) {
-  const PictureMetadata& metadata = picture.metadata;
-  if (metadata.dpiX > 0 && metadata.dpiY > 0) {
-    png_set_pHYs(writer.png, writer.info, static_cast<png_uint_32>(std::lround(metadata.dpiX * kInchesPerMetre)),
-                 static_cast<png_uint_32>(std::lround(metadata.dpiY * kInchesPerMetre)), PNG_RESOLUTION_METER);
-  }
-  if (!keep) return;
-  if (!metadata.icc.empty()) {
-    png_set_benign_errors(writer.png, 1);  // an odd profile is left out, not the picture
-    png_set_iCCP(writer.png, writer.info, "ICC profile", PNG_COMPRESSION_TYPE_BASE, metadata.icc.data(),
-                 static_cast<png_uint_32>(metadata.icc.size()));
-    if (png_get_valid(writer.png, writer.info, PNG_INFO_iCCP) == 0) lost |= kLostIcc;
-  }
-  if (!metadata.exif.empty()) {
-    png_set_eXIf_1(writer.png, writer.info, static_cast<png_uint_32>(metadata.exif.size()),
-                   const_cast<png_bytep>(metadata.exif.data()));
-  }
-}
-
-void SetText(const PngWriter& writer, const char* key, const std::string& text) {
-  png_text entry = {};
-  entry.compression = PNG_ITXT_COMPRESSION_NONE;
-  entry.key = const_cast<png_charp>(key);
-  entry.text = const_cast<png_charp>(text.c_str());
-  entry.itxt_length = text.size();
-  png_set_text(writer.png, writer.info, &entry, 1);
-}
-
-void SetHeader(const PngWriter& writer, const PictureRecord& picture) {
-  const PackedImage& image = picture.image;
-  const int type = ColorType(picture);
-  png_set_IHDR(writer.png, writer.info, static_cast<png_uint_32>(image.Width()), static_cast<png_uint_32>(image.Height()),
-               image.Bits() == 24 ? 8 : image.Bits(), type, PNG_INTERLACE_NONE, PNG_COMPRESSION_TYPE_BASE,
-               PNG_FILTER_TYPE_BASE);
-  if (type == PNG_COLOR_TYPE_PALETTE) {
-    png_color colors[256];
-    for (size_t i = 0; i < static_cast<size_t>(image.Colors()); ++i) {
-      colors[i] = {picture.palette[3 * i], picture.palette[3 * i + 1], picture.palette[3 * i + 2]};
-    }
-    png_set_PLTE(writer.png, writer.info, colors, image.Colors());
-  }
-  png_set_compression_level(writer.png, std::clamp<int>(settings.PngCompression, 0, 9));
-}
-
-void MergeAlpha(const uint8_t* color, const uint8_t* alpha, uint8_t* target, int32_t width) {
-  for (int32_t x = 0; x < width; ++x, color += 3, target += 4) {
-    target[0] = color[0];
-    target[1] = color[1];
-    target[2] = color[2];
-    target[3] = alpha[x];
-  }
-}
-
-// `keep`: whether metadata and comment go along; `lost`: what of them could not.
-Status WriteAll(PngWriter& writer, const PictureRecord& picture, bool keep, uint8_t& lost) {
-  const PackedImage& image = picture.image;
-  const std::string xmp(picture.metadata.xmp.begin(), picture.metadata.xmp.end());
-  const std::string comment(picture.comment.begin(), picture.comment.end());
-  std::vector<uint8_t> merged(picture.alpha.Empty() ? 0 : 4 * static_cast<size_t>(image.Width()));
-  const bool written = Guarded(writer.png, [&] {
-    png_set_write_fn(writer.png, &writer, WriteBytes, FlushNothing);
-    SetHeader(writer, picture);
-    SetMetadata(writer, picture, keep, lost);
-    if (keep && !xmp.empty()) SetText(writer, kXmpKeyword, xmp);
-    if (keep && !comment.empty()) SetText(writer, "Comment", comment);
-    png_write_info(writer.png, writer.info);
-    if (image.Bits() == 24) png_set_bgr(writer.png);
-    for (int32_t y = 0; y < image.Height(); ++y) {
-      const uint8_t* row = image.Row(y).data();
-      if (!merged.empty()) {
-        MergeAlpha(row, picture.alpha.Row(y).data(), merged.data(), image.Width());
-        row = merged.data();
-      }
-      png_write_row(writer.png, row);
-      picture.ReportRow(y);
-    }
-    png_write_end(writer.png, writer.info);
-  });
-  return written ? Status::Ok : Status::ErrorWritingFile;
 }
 
 const char* ColorTypeName(png_byte type) {
@@ -482,13 +449,6 @@ Status DecodePng(std::span<const uint8_t> file, PictureRecord& picture) {
   return ReadPixels(reader, layout, picture);
 }
 
-Status EncodePng(const PictureRecord& picture, ByteWriter& out) {
-  PngWriter writer(out);
-  if (!writer.Ready()) return Status::MemoryAllocationError;
-  uint8_t lost = 0;
-  return WriteAll(writer, picture, false, lost);
-}
-
 Status PngInfo(PictureRecord& picture, const char* fileName, uint32_t) {
   picture.typeName.Clear();
   platform::FileView file;
@@ -504,17 +464,6 @@ Status PngRead(PictureRecord& picture, const char* fileName) {
   platform::FileView file;
   if (!file.Open(fileName)) return Status::FileOpenError;
   return DecodePng(file.Bytes(), picture);
-}
-
-Status PngWrite(PictureRecord& picture, const WriteOptions& options) {
-  const ProgressScope progress(picture);
-  if (picture.image.Empty()) return Status::MemoryAllocationError;
-  ByteWriter out;
-  if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
-  PngWriter writer(out);
-  if (!writer.Ready()) return Status::MemoryAllocationError;
-  RETURN_IF_BAD(WriteAll(writer, picture, options.keepMetadata && settings.PreserveEXIF != 0, picture.lostMetadata));
-  return CommitOutput(out, options);
 }
 
 Status PngDetails(PictureRecord& picture) {

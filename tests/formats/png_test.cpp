@@ -3,7 +3,10 @@
 #include <gtest/gtest.h>
 
 #include "core/settings.h"
+#include "processing/promote.h"
 #include "support/codecs.h"
+#include "support/files.h"
+#include "support/peers.h"
 #include "support/scoped_settings.h"
 
 namespace fotomill::test {
@@ -26,6 +29,43 @@ TEST(Png, MetadataTravels) {
   settings.PreserveEXIF = 0;
   const Decoded without = Decode(PngRead, Encode(PngWrite, *picture));
   EXPECT_TRUE(without.picture->metadata.Empty());
+}
+
+// Bands are deflated apart: their streams must be joined without a gap, and the checks over all of them be right.
+TEST(Png, BandsBecomeOneStream) {
+  const ScopedSettings scoped;
+  const TemporaryFolder folder;
+  struct Row {
+    int32_t level, width, height;
+  };
+  for (const Row& row : {Row{0, 3500, 3600}, Row{1, 1600, 900}, Row{9, 1600, 900}}) {  // nine bands, and twice two
+    SCOPED_TRACE(row.level);
+    settings.PngCompression = row.level;
+    const PicturePointer picture = PatternPicture(row.width, row.height, 24);
+    for (int32_t y = 100; y < 800; ++y) {  // smooth places make blocks of another kind
+      for (size_t i = 0; i < 3000; ++i) picture->image.Row(y)[i] = static_cast<uint8_t>(y + i / 30);
+    }
+    const std::vector<uint8_t> file = Encode(PngWrite, *picture);
+    const Decoded back = Decode(PngRead, file);
+    ASSERT_EQ(back.status, Status::Ok);
+    EXPECT_TRUE(SamePixels(picture->image, back.picture->image));
+    WriteBytes(folder.Path("a.png"), file);
+    if (HasProgram("pngtopnm")) {
+      EXPECT_TRUE(RunShell("pngtopnm " + folder.Path("a.png") + " > " + folder.Path("a.ppm") + " 2> " + folder.Path("log")));
+      EXPECT_EQ(ReadText(folder.Path("log")), "");
+    }
+  }
+}
+
+TEST(Png, AlphaOfPalettePicturesIsKept) {
+  const PicturePointer picture = PatternPicture(33, 7, 4);
+  ASSERT_EQ(NewAlphaPlane(33, 7, picture->alpha), Status::Ok);
+  for (int32_t x = 0; x < 33; ++x) picture->alpha.Row(3)[static_cast<size_t>(x)] = static_cast<uint8_t>(7 * x);
+  const Decoded back = Decode(PngRead, Encode(PngWrite, *picture));
+  ASSERT_EQ(back.status, Status::Ok);
+  EXPECT_TRUE(SamePixels(back.picture->alpha, picture->alpha));
+  ASSERT_EQ(PromotePicture(*picture), Status::Ok);
+  EXPECT_TRUE(SamePixels(back.picture->image, picture->image));
 }
 
 TEST(Png, BrokenFilesFailWithTheirStatus) {
