@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cstdio>
 #include <map>
+#include <unordered_map>
 
 #include "batch/picture_failure.h"
 #include "core/choice_lists.h"
@@ -136,23 +137,18 @@ struct Compared {
   size_t files = 0;
 };
 
-Compared& ComparedBy(std::vector<Compared>& all, const std::string& label) {
-  const auto found = std::ranges::find(all, label, &Compared::label);
-  if (found != all.end()) return *found;
-  all.push_back({label, {}, 0});
-  return all.back();
-}
-
 std::vector<Compared> Compare(std::span<const FileInfo> files) {
   std::vector<Compared> all;
+  std::unordered_map<std::string_view, size_t> places;
   for (const FileInfo& file : files) {
     for (const InfoSection& section : file.sections) {
       if (section.title == kDetailsTitle) continue;  // they mean something in files of one format only
       for (const InfoLine& line : section.lines) {
         if (line.label.empty() || line.label == "File name") continue;
-        Compared& compared = ComparedBy(all, line.label);
-        ++compared.values[line.value];
-        ++compared.files;
+        const auto [place, added] = places.emplace(line.label, all.size());
+        if (added) all.push_back({line.label, {}, 0});
+        ++all[place->second].values[line.value];
+        ++all[place->second].files;
       }
     }
   }

@@ -46,6 +46,7 @@ void EnablePlugins(const std::string& folder) {
   const std::lock_guard lock(scanMutex);
   scanned = false;
   pluginFolder = folder;
+  TakePluginSwitches();
   InstallPluginSource(&kPluginSource);
 }
 

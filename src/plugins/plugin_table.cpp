@@ -5,6 +5,7 @@
 #include <utility>
 #include <vector>
 
+#include "core/ini_file.h"
 #include "core/settings.h"
 #include "core/text.h"
 #include "picture/registry.h"
@@ -26,6 +27,20 @@ struct LoadedEntry {
 std::vector<LoadedEntry>& Table() {
   static std::vector<LoadedEntry> table;
   return table;
+}
+
+constexpr std::string_view kSwitchSection = "Plugins";
+
+// Modules that are switched off.
+std::vector<std::string>& ModulesOff() {
+  static std::vector<std::string> names;
+  return names;
+}
+
+bool IsOn(std::string_view name) { return std::ranges::find(ModulesOff(), name) == ModulesOff().end(); }
+
+std::string FolderOr(const std::string& folder) {
+  return folder.empty() ? platform::JoinFolder(platform::ProgramFolder(), "plugin") : folder;
 }
 
 // "FMWPL*.so": the names of modules. "_x64" marks the twin of a 32-bit module and is never loaded.
@@ -102,12 +117,12 @@ bool ComesBefore(const LoadedEntry& a, const LoadedEntry& b) {
 
 int32_t ScanPlugins(const std::string& folder) {
   UnloadPlugins();
-  const std::string place = folder.empty() ? platform::JoinFolder(platform::ProgramFolder(), "plugin") : folder;
+  const std::string place = FolderOr(folder);
   const auto names = platform::ListFolder(place);
   if (!names) return 0;
   std::vector<LoadedEntry> table;
   for (const platform::FolderEntry& name : *names) {
-    if (!IsModuleName(name.name)) continue;
+    if (!IsModuleName(name.name) || !IsOn(name.name)) continue;
     const std::string path = platform::JoinFolder(place, name.name);
     int32_t registered = 0;
     while (registered < kFormatsPerModule && RegisterFormat(path, registered, table)) ++registered;
@@ -115,6 +130,32 @@ int32_t ScanPlugins(const std::string& folder) {
   std::stable_sort(table.begin(), table.end(), ComesBefore);
   Table() = std::move(table);
   return PluginFormatCount();
+}
+
+std::vector<PluginModule> PluginModules(const std::string& folder) {
+  std::vector<PluginModule> modules;
+  const auto names = platform::ListFolder(FolderOr(folder));
+  if (!names) return modules;
+  for (const platform::FolderEntry& name : *names) {
+    if (IsModuleName(name.name)) modules.push_back({name.name, IsOn(name.name)});
+  }
+  return modules;
+}
+
+void TakePluginSwitches() {
+  ModulesOff().clear();
+  IniReader reader(ConfigurationText(), kSwitchSection);
+  for (IniEntry entry; reader.Next(entry);) {
+    if (entry.value == "0") ModulesOff().emplace_back(entry.key);
+  }
+}
+
+SaveResult SwitchPluginModule(const std::string& name, bool on) {
+  std::erase(ModulesOff(), name);
+  if (!on) ModulesOff().push_back(name);
+  IniEdit edit{name, std::nullopt};
+  if (!on) edit.value = "0";
+  return StoreInSection(kSwitchSection, {&edit, 1});
 }
 
 void UnloadPlugins() { Table().clear(); }

@@ -3,7 +3,9 @@
 #include <cstdint>
 #include <string>
 #include <string_view>
+#include <vector>
 
+#include "core/configuration.h"
 #include "core/fixed_text.h"
 #include "plugins/fotomill_plugin.h"
 
@@ -41,6 +43,18 @@ inline constexpr int32_t kFormatsPerModule = 32;
 // sorted by extension and then by module path. Modules that lack a required export or refuse are skipped in silence.
 // Returns the number of formats. A second scan replaces the first.
 int32_t ScanPlugins(const std::string& folder = {});
+// The modules of that folder by file name, loaded or not, and the user's switch of each: one that is off is passed over
+// by the next scan. The configuration file's section "Plugins" holds a line "NAME=0" for each that is off.
+struct PluginModule {
+  std::string name;
+  bool on = true;
+};
+std::vector<PluginModule> PluginModules(const std::string& folder = {});
+// Takes up the switches of the loaded configuration. Belongs to the main thread, like the configuration; EnablePlugins
+// does it as well.
+void TakePluginSwitches();
+// Switches a module and saves that. What is loaded stays loaded until the next scan.
+SaveResult SwitchPluginModule(const std::string& name, bool on);
 // Unloads every module; formats that are bound to a row must not be used afterwards.
 void UnloadPlugins();
 

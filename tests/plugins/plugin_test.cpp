@@ -2,8 +2,11 @@
 
 #include <filesystem>
 
+#include "core/configuration.h"
+#include "core/data_folder.h"
 #include "core/settings.h"
 #include "picture/registry.h"
+#include "platform/paths.h"
 #include "plugins/plugin_bridge.h"
 #include "plugins/plugin_table.h"
 #include "support/files.h"
@@ -70,6 +73,26 @@ TEST_F(Plugins, OnlyModulesByNameAreLoaded) {
   EXPECT_LT(PluginRow(0).path.view(), PluginRow(1).path.view());
   EXPECT_TRUE(PluginCanHandle("x.ABC"));
   EXPECT_FALSE(PluginCanHandle("x.xyz"));
+}
+
+TEST_F(Plugins, AModuleThatIsOffIsPassedOver) {
+  SetDataFolder(folder_.Path("data"));
+  (void)LoadConfiguration();
+  const std::string module = OddFolder("GAPS_IN_LIST") + "/FMWPL_odd.so";
+  for (const char* name : {"FMWPL_a.so", "FMWPL_b.so"}) std::filesystem::copy_file(module, folder_.Path(name));
+  EXPECT_EQ(SwitchPluginModule("FMWPL_a.so", false), SaveResult::Done);
+  (void)LoadConfiguration();
+  EnablePlugins(folder_.Path());
+  EXPECT_EQ(PluginFormats().size(), 2u);
+  EXPECT_EQ(platform::FileNameOf(PluginRow(0).path), "FMWPL_b.so");
+  const std::vector<PluginModule> modules = PluginModules(folder_.Path());
+  ASSERT_EQ(modules.size(), 2u);
+  EXPECT_FALSE(modules[0].on);
+  EXPECT_EQ(SwitchPluginModule("FMWPL_a.so", true), SaveResult::Done);
+  EXPECT_EQ(test::ReadText(ConfigurationPath()), "[Plugins]\n");
+  EXPECT_EQ(ScanPlugins(folder_.Path()), 4);
+  SetDataFolder({});
+  (void)LoadConfiguration();
 }
 
 TEST_F(Plugins, WhatAModuleReturnsIsChecked) {

@@ -2,6 +2,7 @@
 
 #include "core/choice_lists.h"
 #include "desktop/windows/batch_runner.h"
+#include "desktop/windows/command_finder.h"
 #include "desktop/windows/file_actions.h"
 #include "desktop/windows/main_frame.h"
 #include "desktop/windows/sequential_rename_dialog.h"
@@ -162,6 +163,7 @@ constexpr Command kCommands[] = {
     {kTools, nullptr},
     {kTools, "&Setup...",            "Ctrl+,",       "Shows all settings.", Needs::Nothing, ShowSetup, "setup"},
 
+    {kHelp, "&Find command...",      "Ctrl+K",       "Finds a command by words of its name.", Needs::Nothing, FindCommand},
     {kHelp, "&Configuration",        "F1",           "Tells how settings are kept.", Needs::Nothing, ShowHelp},
 };
 // clang-format on

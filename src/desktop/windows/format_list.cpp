@@ -2,6 +2,7 @@
 
 #include <wx/msgdlg.h>
 
+#include "desktop/event_log.h"
 #include "desktop/windows/wx_text.h"
 #include "picture/format_switches.h"
 #include "picture/registry.h"
@@ -38,11 +39,18 @@ FormatList::FormatList(wxWindow* parent)
   Bind(wxEVT_DATAVIEW_ITEM_VALUE_CHANGED, [this](wxDataViewEvent& event) {
     if (event.GetColumn() == kOnColumn) Turn(event.GetItem());
   });
-  Bind(wxEVT_DATAVIEW_ITEM_ACTIVATED, [this](wxDataViewEvent& event) {
-    const auto line = static_cast<unsigned>(ItemToRow(event.GetItem()));
+  const auto toggle = [this](const wxDataViewItem& item) {
+    if (!item.IsOk()) return;
+    const auto line = static_cast<unsigned>(ItemToRow(item));
     SetToggleValue(!GetToggleValue(line, kOnColumn), line, kOnColumn);
-    Turn(event.GetItem());
+    Turn(item);
+  };
+  Bind(wxEVT_DATAVIEW_ITEM_ACTIVATED, [toggle](wxDataViewEvent& event) { toggle(event.GetItem()); });
+  Bind(wxEVT_CHAR_HOOK, [this, toggle](wxKeyEvent& event) {
+    if (event.GetKeyCode() == WXK_SPACE) return toggle(GetSelection());
+    event.Skip();
   });
+  if (GetItemCount() > 0) SetCurrentItem(RowToItem(0));
 }
 
 void FormatList::Turn(const wxDataViewItem& item) {
@@ -51,6 +59,7 @@ void FormatList::Turn(const wxDataViewItem& item) {
   const bool on = GetToggleValue(line, kOnColumn);
   if (on == (FormatRow(index).enabled != 0)) return;
   const SaveResult saved = SwitchFormat(index, on);
+  LogEvent("formats", Utf8(GetTextValue(line, kFormatColumn)) + (on ? " on" : " off"));
   if (saved == SaveResult::Done || saved == SaveResult::Unchanged) return;
   wxMessageBox(Shown(std::string(SaveMessage(saved)) + " The switch is turned until the program ends."), "Formats", wxOK | wxICON_WARNING,
                wxGetTopLevelParent(this));

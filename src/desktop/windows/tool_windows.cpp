@@ -32,7 +32,10 @@ void ShowFileHistory(MainFrame& frame) {
   LogEvent("history", "closed");
 }
 void ShowCompaction(MainFrame& frame) { CompactionBox(&frame, frame.CurrentFolder()).ShowModal(); }
-void ShowCleanUp(MainFrame& frame) { CleanUpBox(&frame, frame.CurrentFolder()).ShowModal(); }
+void ShowCleanUp(MainFrame& frame) {
+  CleanUpBox(&frame, frame.CurrentFolder()).ShowModal();
+  LogEvent("cleanup", "closed");
+}
 void ShowPlugins(MainFrame& frame) { PluginBox(&frame).ShowModal(); }
 void ShowHelp(MainFrame& frame) { ShowHelpPage(&frame, kGeneralHelpPage); }
 

@@ -13,6 +13,7 @@
 #include "core/text.h"
 #include "desktop/event_log.h"
 #include "desktop/windows/bitmaps.h"
+#include "desktop/windows/info_frame.h"
 #include "desktop/windows/main_frame.h"
 #include "desktop/windows/wx_text.h"
 #include "platform/clock.h"
@@ -63,6 +64,7 @@ const ViewCommand kViewCommands[] = {
     {"Full &screen",      "F11",       {WXK_F11, 'F'},                  [](ViewFrame& view) { view.ToggleFullScreen(); }},
     {"Slides&how",        "S",         {'S', WXK_F8},                   [](ViewFrame& view) { view.ToggleSlideshow(); }},
     {"In&formation",      "I",         {'I'},                           [](ViewFrame& view) { view.ToggleOverlay(); }},
+    {"G&et info...",      "Alt+Enter", {},                              [](ViewFrame& view) { view.ShowInfoWindow(); }},
     {nullptr, nullptr, {}, nullptr},
     {"&Copy picture",     "Ctrl+C",    {WXK_CONTROL_C},                 [](ViewFrame& view) { view.CopyPicture(); }},
     {"&Close",            "Esc",       {WXK_ESCAPE, WXK_RETURN, WXK_NUMPAD_ENTER}, [](ViewFrame& view) { view.Leave(); }},
@@ -341,6 +343,8 @@ void ViewFrame::ToggleSlideshow() {
   slideTimer_.Start(kSlideMs);
 }
 
+void ViewFrame::ShowInfoWindow() { (new InfoFrame(this, {list_[place_]}))->Show(); }
+
 void ViewFrame::ToggleOverlay() {
   overlay_ = !overlay_;
   canvas_->Refresh();
@@ -374,6 +378,7 @@ void ViewFrame::OnKey(wxKeyEvent& event) {
   }
   if (key == WXK_LEFT || key == WXK_UP) return Step(-1);
   if (key == WXK_RIGHT || key == WXK_DOWN) return Step(1);
+  if (event.AltDown() && key == WXK_RETURN) return ShowInfoWindow();
   if (event.AltDown()) return event.Skip();
   const int typed = event.ControlDown() ? (key == 'C' ? static_cast<int>(WXK_CONTROL_C) : 0) : key;
   for (const ViewCommand& command : kViewCommands) {

@@ -33,6 +33,7 @@ class ViewFrame : public wxFrame {
   void ToggleOverlay();
   void Leave();  // full screen first, then the window
   void CopyPicture();
+  void ShowInfoWindow();
   size_t LastPlace() const { return list_.size() - 1; }
   bool CanPan() const { return transform_.CanPan(); }
   void PanBy(int stepsAcross, int stepsDown);
