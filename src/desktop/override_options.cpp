@@ -20,7 +20,7 @@ const std::vector<OverrideOptions>& AllOverrideOptions() {
       {"PNG",  "OverridePngBox",  {PngCompression}},
       {"TGA",  "OverrideTgaBox",  {CreateTarga16}},
       {"TIF",  "OverrideTifBox",  {TiffOptions, TiffResolution, JpegCompression}},
-      {"WEBP", "OverrideWebPBox", {WebPLossless, WebPQualityFactor}},
+      {"WEBP", "OverrideWebPBox", {WebPLossless, WebPQualityFactor, WebPAllowMixed}},
   };
   // clang-format on
   return options;

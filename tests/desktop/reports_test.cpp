@@ -13,7 +13,7 @@
 #include "desktop/configuration_transfer.h"
 #include "desktop/exif_report.h"
 #include "desktop/history_dates.h"
-#include "desktop/history_list.h"
+#include "desktop/file_history_list.h"
 #include "desktop/info_report.h"
 #include "desktop/upkeep.h"
 #include "metadata/exif_text.h"
@@ -128,7 +128,7 @@ TEST_F(Reports, HistorySortsRemovesAndForgets) {
   ASSERT_TRUE(RecordFileHistory(Sample("a10.bmp"), FileFunction::Convert, 300, 100));
   ASSERT_TRUE(RecordFileHistory(Sample("a2.bmp"), FileFunction::View, 100, 300));
   ASSERT_TRUE(RecordFileHistory(Sample("B.bmp"), FileFunction::Crop, 200, 200));
-  HistoryList list;
+  FileHistoryList list;
   list.Take();
   const auto names = [&] {
     std::vector<std::string> shown;

@@ -23,7 +23,7 @@ std::set<std::string> UsedKeys() {
     const std::string name = entry.path().filename().string();
     if (!entry.is_regular_file() || name == "setup_pages.cpp" || name == "override_options.cpp" || name == "spin_range.cpp") continue;
     const std::string text = test::ReadText(entry.path().string());
-    for (const std::string_view lead : {"settings.", "KeyNumber::"}) {
+    for (const std::string_view lead : {"settings.", "KeyNumber::", "&Settings::"}) {
       for (size_t at = text.find(lead); at != std::string::npos; at = text.find(lead, at + 1)) {
         const size_t start = at + lead.size();
         size_t end = start;

@@ -38,7 +38,7 @@ int ThumbnailSide() {
 
 class FileHistoryBox::Lines : public wxDataViewVirtualListModel {
  public:
-  Lines(const HistoryList& history, const HistoryThumbnails& thumbnails) : history_(history), thumbnails_(thumbnails) {}
+  Lines(const FileHistoryList& history, const HistoryThumbnails& thumbnails) : history_(history), thumbnails_(thumbnails) {}
   void GetValueByRow(wxVariant& value, unsigned int row, unsigned int column) const override {
     if (row >= history_.Count()) {
       value = wxString();
@@ -51,7 +51,7 @@ class FileHistoryBox::Lines : public wxDataViewVirtualListModel {
   bool SetValueByRow(const wxVariant&, unsigned int, unsigned int) override { return false; }
 
  private:
-  const HistoryList& history_;
+  const FileHistoryList& history_;
   const HistoryThumbnails& thumbnails_;
 };
 

@@ -4,7 +4,7 @@
 
 #include <string>
 
-#include "desktop/history_list.h"
+#include "desktop/file_history_list.h"
 #include "desktop/windows/history_thumbnails.h"
 
 class wxDataViewCtrl;
@@ -37,7 +37,7 @@ class FileHistoryBox : public wxDialog {
   void KeepPlaces();
 
   MainFrame& frame_;
-  HistoryList history_;
+  FileHistoryList history_;
   HistoryThumbnails thumbnails_;
   wxDataViewCtrl* list_ = nullptr;
   wxStaticText* count_ = nullptr;

@@ -6,7 +6,7 @@
 #include <cstring>
 
 #include "core/choice_lists.h"
-#include "desktop/history_list.h"
+#include "desktop/file_history_list.h"
 #include "platform/files.h"
 
 namespace fotomill::desktop {

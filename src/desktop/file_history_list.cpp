@@ -1,4 +1,4 @@
-#include "desktop/history_list.h"
+#include "desktop/file_history_list.h"
 
 #include <algorithm>
 
@@ -55,7 +55,7 @@ int Compare(const HistoryRow& a, const HistoryRow& b, int32_t column) {
 
 std::span<const HistoryColumnFacts> HistoryColumns() { return kColumns; }
 
-void HistoryList::Take() {
+void FileHistoryList::Take() {
   rows_.clear();
   for (size_t i = 0; i < FileHistoryCount(); ++i) {
     const FileHistoryEntry entry = FileHistoryAt(i);
@@ -65,19 +65,19 @@ void HistoryList::Take() {
   Sort();
 }
 
-void HistoryList::SortBy(int32_t column) {
+void FileHistoryList::SortBy(int32_t column) {
   reversed_ = column == column_ && !reversed_;
   column_ = column;
   Sort();
 }
 
-void HistoryList::Sort() {
+void FileHistoryList::Sort() {
   std::ranges::sort(rows_, [this](const HistoryRow& a, const HistoryRow& b) {
     return reversed_ ? Compare(b, a, column_) < 0 : Compare(a, b, column_) < 0;
   });
 }
 
-std::string HistoryList::Cell(size_t row, size_t column) const {
+std::string FileHistoryList::Cell(size_t row, size_t column) const {
   const HistoryRow& entry = rows_[row];
   switch (static_cast<int32_t>(column)) {
     case choice::kColumnName: return std::string(platform::FileNameOf(entry.path));
@@ -90,7 +90,7 @@ std::string HistoryList::Cell(size_t row, size_t column) const {
   }
 }
 
-bool HistoryList::Remove(std::vector<size_t> rows) {
+bool FileHistoryList::Remove(std::vector<size_t> rows) {
   std::ranges::sort(rows, std::greater<>());
   for (const size_t row : rows) {
     (void)RemoveFromFileHistory(rows_[row].path);
@@ -101,7 +101,7 @@ bool HistoryList::Remove(std::vector<size_t> rows) {
   return saved;
 }
 
-bool HistoryList::Clear() {
+bool FileHistoryList::Clear() {
   rows_.clear();
   ClearFileHistory();
   const std::string path = FileHistoryPath();

@@ -27,7 +27,7 @@ struct HistoryRow {
 };
 
 // The entries of the file history in the order of a column. Belongs to the main thread.
-class HistoryList {
+class FileHistoryList {
  public:
   // Takes up the history as it is now, and sorts it as FileHistorySortMode says.
   void Take();
