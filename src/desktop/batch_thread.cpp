@@ -12,7 +12,7 @@ namespace fotomill::desktop {
 
 namespace {
 
-constexpr int32_t kPreviewSide = 240;
+constexpr int32_t kPreviewSide = 200;
 
 std::string DimensionsText(int32_t width, int32_t height, int32_t bits) {
   return std::to_string(width) + " x " + std::to_string(height) + ", " + std::to_string(bits) + " bits";

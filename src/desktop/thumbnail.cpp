@@ -2,6 +2,8 @@
 
 #include <algorithm>
 #include <mutex>
+#include <utility>
+#include <vector>
 
 #include "catalog/thumbnail_database.h"
 #include "catalog/thumbnail_file.h"
@@ -22,30 +24,62 @@ bool ReadCurrentFile(const ThumbnailWish& wish, ThumbnailRecord& record) {
   return facts.kind == platform::FileKind::Regular && facts.modified >= wish.modified && ReadThumbnailFile(record, path);
 }
 
-// The database that was asked last stays open: its index is what makes a search quick.
-bool FindInDatabase(const ThumbnailWish& wish, ThumbnailRecord& record) {
-  static std::mutex mutex;
-  static std::string openPath;
-  static ThumbnailDatabase database;
-  const std::string folder(platform::SplitPath(wish.path).folder);
-  const std::string path = ThumbnailDatabasePath(wish.mode == choice::kGlobalDatabase ? std::string() : folder);
-  const std::lock_guard lock(mutex);
-  if (path != openPath) {
-    openPath.clear();
-    database.CloseThumbnailDatabase();
-    if (database.OpenThumbnailDatabase(path, false) != ThumbnailDatabase::Opened::Done) return false;
-    openPath = path;
-  }
-  return database.Find(wish.path, VolumeKeyFor(wish.path), record);
+bool InDatabase(const ThumbnailWish& wish) { return wish.mode == choice::kGlobalDatabase || wish.mode == choice::kLocalDatabase; }
+
+std::string DatabaseFor(const ThumbnailWish& wish) {
+  return ThumbnailDatabasePath(wish.mode == choice::kGlobalDatabase ? std::string() : std::string(platform::SplitPath(wish.path).folder));
 }
+
+// The database that was asked last stays open: its index is what makes a search quick. New records are gathered, since
+// every append waits for the disk.
+class OpenDatabase {
+ public:
+  bool Find(const ThumbnailWish& wish, ThumbnailRecord& record) {
+    const std::lock_guard lock(mutex_);
+    return Open(DatabaseFor(wish), false) && database_.Find(wish.path, VolumeKeyFor(wish.path), record);
+  }
+  void Add(const ThumbnailWish& wish, const ThumbnailRecord& record) {
+    const std::lock_guard lock(mutex_);
+    const std::string path = DatabaseFor(wish);
+    if (path != newPath_ || new_.size() >= kGathered) Write();
+    newPath_ = path;
+    new_.push_back({record, wish.path, VolumeKeyFor(wish.path), false});
+  }
+  void Flush() {
+    const std::lock_guard lock(mutex_);
+    Write();
+  }
+
+ private:
+  static constexpr size_t kGathered = 64;
+
+  bool Open(const std::string& path, bool create) {
+    if (path == openPath_) return true;
+    openPath_.clear();
+    database_.CloseThumbnailDatabase();
+    if (database_.OpenThumbnailDatabase(path, create) != ThumbnailDatabase::Opened::Done) return false;
+    openPath_ = path;
+    return true;
+  }
+  // A database that cannot be written to costs the thumbnails no more than being made again.
+  void Write() {
+    const std::vector<DatabaseRecord> records = std::exchange(new_, {});
+    if (!records.empty() && Open(newPath_, true)) (void)database_.AppendDatabaseRecords(records, true);
+  }
+
+  std::mutex mutex_;
+  std::string openPath_, newPath_;
+  ThumbnailDatabase database_;
+  std::vector<DatabaseRecord> new_;
+};
+OpenDatabase openDatabase;
 
 bool FindRecord(const ThumbnailWish& wish, ThumbnailRecord& record) {
   if (wish.side > kSmallThumbnailSide) return false;  // a record would have to be enlarged
   if (wish.mode == choice::kDiskBased || settings.AlwaysUseTHN != 0) {
     if (ReadCurrentFile(wish, record)) return true;
   }
-  if (wish.mode != choice::kGlobalDatabase && wish.mode != choice::kLocalDatabase) return false;
-  return FindInDatabase(wish, record);
+  return InDatabase(wish) && openDatabase.Find(wish, record);
 }
 
 Status PixelsOfRecord(const ThumbnailRecord& record, RgbImage& pixels) {
@@ -75,6 +109,8 @@ Status MakeFromPicture(const ThumbnailWish& wish, Thumbnail& thumbnail) {
   RETURN_IF_BAD(ReadPicture(*picture));
   thumbnail.alpha = !picture->alpha.Empty();
   RETURN_IF_BAD(PrepareForDisplay(*picture, static_cast<Color>(settings.ThumbnailMatte)));
+  ThumbnailRecord record;
+  if (InDatabase(wish) && settings.AutoCreateThumbnail != 0 && MakeThumbnailRecord(record, *picture)) openDatabase.Add(wish, record);
   return ScaleDown(picture->image, wish.side, thumbnail.pixels);
 }
 
@@ -91,6 +127,8 @@ ThumbnailPointer LoadThumbnail(const ThumbnailWish& wish) {
   if (thumbnail->status != Status::Ok) thumbnail->pixels = {};
   return thumbnail;
 }
+
+void KeepThumbnailRecords() { openDatabase.Flush(); }
 
 Status WriteThumbnail(const std::string& path) {
   ThumbnailRecord record;

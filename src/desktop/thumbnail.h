@@ -34,6 +34,9 @@ using ThumbnailPointer = std::shared_ptr<const Thumbnail>;
 // picture and large enough, else from the picture itself. Takes as long as it takes; called by workers.
 ThumbnailPointer LoadThumbnail(const ThumbnailWish& wish);
 
+// Writes the records that were made for databases since the last call; LoadThumbnail does it as well, now and then.
+void KeepThumbnailRecords();
+
 // Makes a picture's thumbnail record and writes its thumbnail file.
 Status WriteThumbnail(const std::string& path);
 

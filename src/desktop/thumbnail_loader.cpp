@@ -6,8 +6,8 @@
 
 namespace fotomill::desktop {
 
-ThumbnailLoader::ThumbnailLoader(unsigned workers, std::function<void()> wake, Load load)
-    : wake_(std::move(wake)), load_(load) {
+ThumbnailLoader::ThumbnailLoader(unsigned workers, std::function<void()> wake, Load load, void (*idle)())
+    : wake_(std::move(wake)), load_(load), idle_(idle) {
   for (unsigned i = 0; i < workers; ++i) workers_.emplace_back([this] { Work(); });
 }
 
@@ -55,9 +55,10 @@ void ThumbnailLoader::Work() {
     inWork_.erase(wish.path);
     const bool tell = results_.empty() && !stop_;
     results_.push_back({std::move(wish), std::move(thumbnail)});
-    if (!tell) continue;
+    const bool last = wishes_.empty() && inWork_.empty();
     lock.unlock();
-    wake_();
+    if (tell) wake_();
+    if (last) idle_();
     lock.lock();
   }
 }

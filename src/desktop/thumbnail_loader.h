@@ -24,8 +24,9 @@ class ThumbnailLoader {
   };
   using Load = ThumbnailPointer (*)(const ThumbnailWish& wish);
 
-  // `wake` is called on a worker when results wait that nobody was told of yet.
-  ThumbnailLoader(unsigned workers, std::function<void()> wake, Load load = LoadThumbnail);
+  // `wake` is called on a worker when results wait that nobody was told of yet, `idle` on the worker that has done the last
+  // wish.
+  ThumbnailLoader(unsigned workers, std::function<void()> wake, Load load = LoadThumbnail, void (*idle)() = KeepThumbnailRecords);
   // Waits for what is in work.
   ~ThumbnailLoader();
   ThumbnailLoader(const ThumbnailLoader&) = delete;
@@ -42,6 +43,7 @@ class ThumbnailLoader {
 
   const std::function<void()> wake_;
   const Load load_;
+  void (*const idle_)();
   mutable std::mutex mutex_;
   std::condition_variable wanted_;
   std::vector<ThumbnailWish> wishes_;  // the most urgent last

@@ -138,7 +138,17 @@ class Desktop:
     def type(self, text):
         self.xdotool("type", "--delay", "20", text)
 
+    def settle(self):
+        """Waits until the screen has stopped changing."""
+        frame, still, end = None, 0, time.monotonic() + PATIENCE
+        while still < 3 and time.monotonic() < end:
+            time.sleep(0.1)
+            now = (Path(self.frames.name) / "Xvfb_screen0").read_bytes()
+            still = still + 1 if now == frame else 0
+            frame = now
+
     def screenshot(self, name):
+        self.settle()
         place = PROJECT / "build/screenshots"
         place.mkdir(parents=True, exist_ok=True)
         (place / (name + ".png")).write_bytes(png_of_xwd((Path(self.frames.name) / "Xvfb_screen0").read_bytes()))

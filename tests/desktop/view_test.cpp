@@ -3,10 +3,11 @@
 #include <atomic>
 #include <condition_variable>
 
-#include "core/settings.h"
+#include "core/choice_lists.h"
 #include "desktop/thumbnail_loader.h"
 #include "desktop/view_picture.h"
 #include "desktop/view_transform.h"
+#include "support/files.h"
 
 namespace fotomill::desktop {
 namespace {
@@ -83,6 +84,23 @@ TEST(Thumbnail, MatteIsCutOff) {
   EXPECT_EQ(cut.height, 2);
   EXPECT_EQ(cut.Row(0)[0], 9);
   EXPECT_GT(WithoutMatte(FilledImage(6, 6, 0x112233), 0x112233).width, 0);
+}
+
+TEST(Thumbnail, DatabaseModesKeepWhatTheyMade) {
+  const test::TemporaryFolder folder;
+  const std::string picture = folder.Path("a.bmp");
+  std::filesystem::copy_file(test::SourcePath("samples/bmp-true-colour.bmp"), picture);
+  ThumbnailWish wish{picture, 1, 1, 96, choice::kLocalDatabase};
+  for (int time = 0; time < 2; ++time) {  // the second time it comes from the database
+    const ThumbnailPointer thumbnail = LoadThumbnail(wish);
+    ASSERT_EQ(thumbnail->status, Status::Ok);
+    EXPECT_EQ(thumbnail->pixels.width, 96);
+    EXPECT_EQ(thumbnail->width, time == 0 ? 150 : 0);
+    KeepThumbnailRecords();
+    EXPECT_EQ(std::filesystem::file_size(folder.Path("Fotomill.tdb")), 60u + 28442u);
+  }
+  wish = {folder.Path("none.bmp"), 1, 1, 96, choice::kLocalDatabase};
+  EXPECT_EQ(LoadThumbnail(wish)->status, Status::FileOpenError);
 }
 
 std::mutex gate;

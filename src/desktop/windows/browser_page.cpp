@@ -16,6 +16,7 @@
 #include "desktop/event_log.h"
 #include "desktop/windows/bitmaps.h"
 #include "desktop/windows/details_list.h"
+#include "desktop/windows/folder_drop.h"
 #include "desktop/windows/thumbnail_canvas.h"
 #include "desktop/windows/update_bar.h"
 #include "desktop/windows/wx_text.h"
@@ -29,28 +30,6 @@ namespace {
 
 constexpr int kGatherMs = 300;  // changes of a folder are gathered for so long
 constexpr size_t kMostHistory = 100;
-
-// Files dropped on a browser go into its folder.
-class FolderDrop : public wxFileDropTarget {
- public:
-  FolderDrop(BrowserPage& page, BrowserHost& host) : page_(page), host_(host) {}
-  wxDragResult OnDragOver(wxCoord, wxCoord, wxDragResult suggested) override { return last_ = suggested; }
-  bool OnDropFiles(wxCoord, wxCoord, const wxArrayString& names) override {
-    std::vector<std::string> files;
-    for (const wxString& name : names) files.push_back(Utf8(name));
-    const std::string folder = page_.Model().Folder();
-    const bool own = !files.empty() && platform::SplitPath(files[0]).folder == platform::JoinFolder(folder, "");
-    if (own) return false;
-    const bool move = last_ == wxDragMove;
-    page_.CallAfter([host = &host_, files, folder, move] { host->DropFiles(files, folder, move); });
-    return true;
-  }
-
- private:
-  BrowserPage& page_;
-  BrowserHost& host_;
-  wxDragResult last_ = wxDragCopy;
-};
 
 }  // namespace
 
@@ -102,7 +81,9 @@ BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& 
   sizer->Add(updateBar_, wxSizerFlags().Expand());
   sizer->Add(views_, wxSizerFlags(1).Expand());
   SetSizer(sizer);
-  SetDropTarget(new FolderDrop(*this, host_));
+  SetDropTarget(new FolderDrop(
+      [this](const wxPoint&) { return model_.Folder(); },
+      [this](const std::vector<std::string>& files, const std::string& folder, bool move) { host_.DropFiles(files, folder, move); }));
   Bind(wxEVT_TIMER, [this](wxTimerEvent&) { Reload(); });
   Bind(wxEVT_FSWATCHER, [this](wxFileSystemWatcherEvent& event) {
     constexpr int kNoChange = wxFSW_EVENT_ACCESS | wxFSW_EVENT_WARNING | wxFSW_EVENT_ERROR;

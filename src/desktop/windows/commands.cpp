@@ -23,6 +23,14 @@ void ShowAs(MainFrame& frame) {
   if (BrowserPage* browser = frame.Browser()) browser->SetViewMode(view);
 }
 
+// Whether a mode of the browser in front has a value.
+template <int32_t BrowserModes::*mode, int32_t value>
+bool Has(const MainFrame& frame) {
+  const BrowserPage* browser = frame.Browser();
+  return browser != nullptr && browser->Model().Modes().*mode == value;
+}
+bool HasFolders(const MainFrame& frame) { return frame.FoldersShown(); }
+
 template <int32_t mode>
 void ThumbnailsFrom(MainFrame& frame) {
   if (BrowserPage* browser = frame.Browser()) browser->SetThumbnailMode(mode);
@@ -106,7 +114,6 @@ constexpr Command kCommands[] = {
     {kEdit, "Copy pat&hs",         "Ctrl+Shift+C", "Puts the paths of the files on the clipboard as text.", Needs::Item, CopyPaths, nullptr, true},
     {kEdit, nullptr},
     {kEdit, "&Rename...",          "F2",           "Gives the focused file another name.", Needs::Item, OfBrowser<&BrowserPage::EditFocusedName>, nullptr, true},
-    {kEdit, "Rename in se&quence...", "Shift+F2",  "Numbers the selected files.", Needs::Files, RenameSelectionSequentially, "rename", true},
     {kEdit, nullptr},
     {kEdit, "Select &all",         "Ctrl+A",       "Selects all files that are shown.", Needs::Nothing, Select<&Selection::SelectAll>},
     {kEdit, "Select &none",        "Ctrl+Shift+A", "Selects nothing.", Needs::Nothing, Select<&Selection::SelectNone>},
@@ -115,27 +122,27 @@ constexpr Command kCommands[] = {
     {kEdit, nullptr},
     {kEdit, "&Filter",             "Ctrl+F",       "Shows only files whose names match.", Needs::Nothing, OfBrowser<&BrowserPage::EditFilter>},
 
-    {kView, "&List",               "Ctrl+1",       "Shows names only.", Needs::Nothing, ShowAs<choice::kViewList>},
-    {kView, "&Details",            "Ctrl+2",       "Shows names with type, size, date and dimensions.", Needs::Nothing, ShowAs<choice::kViewDetails>},
-    {kView, "&Small thumbnails",   "Ctrl+3",       "Shows small thumbnails.", Needs::Nothing, ShowAs<choice::kViewSmall>},
-    {kView, "&Normal thumbnails",  "Ctrl+4",       "Shows thumbnails of 96 pixels.", Needs::Nothing, ShowAs<choice::kViewNormal>},
-    {kView, "Lar&ge thumbnails",   "Ctrl+5",       "Shows thumbnails of 176 pixels.", Needs::Nothing, ShowAs<choice::kViewLarge>},
+    {kView, "&List",               "Ctrl+1",       "Shows names only.", Needs::Nothing, ShowAs<choice::kViewList>, nullptr, false, Has<&BrowserModes::view, choice::kViewList>},
+    {kView, "&Details",            "Ctrl+2",       "Shows names with type, size, date and dimensions.", Needs::Nothing, ShowAs<choice::kViewDetails>, nullptr, false, Has<&BrowserModes::view, choice::kViewDetails>},
+    {kView, "&Small thumbnails",   "Ctrl+3",       "Shows small thumbnails.", Needs::Nothing, ShowAs<choice::kViewSmall>, nullptr, false, Has<&BrowserModes::view, choice::kViewSmall>},
+    {kView, "&Normal thumbnails",  "Ctrl+4",       "Shows thumbnails of 96 pixels.", Needs::Nothing, ShowAs<choice::kViewNormal>, nullptr, false, Has<&BrowserModes::view, choice::kViewNormal>},
+    {kView, "Lar&ge thumbnails",   "Ctrl+5",       "Shows thumbnails of 176 pixels.", Needs::Nothing, ShowAs<choice::kViewLarge>, nullptr, false, Has<&BrowserModes::view, choice::kViewLarge>},
     {kView, "Lar&ger",             "Ctrl++",       "Shows larger thumbnails.", Needs::Nothing, Larger},
     {kView, "S&maller",            "Ctrl+-",       "Shows smaller thumbnails.", Needs::Nothing, Smaller},
     {kView, nullptr},
-    {kView, "Sort by na&me",       "",             "Sorts by name; again, the other way round.", Needs::Nothing, SortBy<choice::kSortName>},
-    {kView, "Sort by &type",       "",             "Sorts by type; again, the other way round.", Needs::Nothing, SortBy<choice::kSortType>},
-    {kView, "Sort by si&ze",       "",             "Sorts by size; again, the other way round.", Needs::Nothing, SortBy<choice::kSortSize>},
-    {kView, "Sort by d&ate",       "",             "Sorts by date; again, the other way round.", Needs::Nothing, SortBy<choice::kSortDate>},
-    {kView, "Sort by E&XIF date",  "",             "Sorts by the date on which pictures were taken; again, the other way round.", Needs::Nothing, SortBy<choice::kSortExifDate>},
-    {kView, "Sort by d&imensions", "",             "Sorts by the number of pixels; again, the other way round.", Needs::Nothing, SortBy<choice::kSortDimensions>},
+    {kView, "Sort by na&me",       "",             "Sorts by name; again, the other way round.", Needs::Nothing, SortBy<choice::kSortName>, nullptr, false, Has<&BrowserModes::sort, choice::kSortName>},
+    {kView, "Sort by &type",       "",             "Sorts by type; again, the other way round.", Needs::Nothing, SortBy<choice::kSortType>, nullptr, false, Has<&BrowserModes::sort, choice::kSortType>},
+    {kView, "Sort by si&ze",       "",             "Sorts by size; again, the other way round.", Needs::Nothing, SortBy<choice::kSortSize>, nullptr, false, Has<&BrowserModes::sort, choice::kSortSize>},
+    {kView, "Sort by d&ate",       "",             "Sorts by date; again, the other way round.", Needs::Nothing, SortBy<choice::kSortDate>, nullptr, false, Has<&BrowserModes::sort, choice::kSortDate>},
+    {kView, "Sort by E&XIF date",  "",             "Sorts by the date on which pictures were taken; again, the other way round.", Needs::Nothing, SortBy<choice::kSortExifDate>, nullptr, false, Has<&BrowserModes::sort, choice::kSortExifDate>},
+    {kView, "Sort by d&imensions", "",             "Sorts by the number of pixels; again, the other way round.", Needs::Nothing, SortBy<choice::kSortDimensions>, nullptr, false, Has<&BrowserModes::sort, choice::kSortDimensions>},
     {kView, nullptr},
-    {kView, "T&humbnails: disk-based", "",         "Thumbnails come from the files beside the pictures.", Needs::Nothing, ThumbnailsFrom<choice::kDiskBased>},
-    {kView, "Thumbnails: &virtual", "",            "Thumbnails are kept in memory only.", Needs::Nothing, ThumbnailsFrom<choice::kVirtual>},
-    {kView, "Thumbnails: glo&bal database", "",    "Thumbnails come from the database in the data folder.", Needs::Nothing, ThumbnailsFrom<choice::kGlobalDatabase>},
-    {kView, "Thumbnails: lo&cal database", "",     "Thumbnails come from the database in the folder.", Needs::Nothing, ThumbnailsFrom<choice::kLocalDatabase>},
+    {kView, "T&humbnails: disk-based", "",         "Thumbnails come from the files beside the pictures.", Needs::Nothing, ThumbnailsFrom<choice::kDiskBased>, nullptr, false, Has<&BrowserModes::thumbnails, choice::kDiskBased>},
+    {kView, "Thumbnails: &virtual", "",            "Thumbnails are kept in memory only.", Needs::Nothing, ThumbnailsFrom<choice::kVirtual>, nullptr, false, Has<&BrowserModes::thumbnails, choice::kVirtual>},
+    {kView, "Thumbnails: glo&bal database", "",    "Thumbnails come from the database in the data folder.", Needs::Nothing, ThumbnailsFrom<choice::kGlobalDatabase>, nullptr, false, Has<&BrowserModes::thumbnails, choice::kGlobalDatabase>},
+    {kView, "Thumbnails: lo&cal database", "",     "Thumbnails come from the database in the folder.", Needs::Nothing, ThumbnailsFrom<choice::kLocalDatabase>, nullptr, false, Has<&BrowserModes::thumbnails, choice::kLocalDatabase>},
     {kView, nullptr},
-    {kView, "&Folders",            "F9",           "Shows or hides the folders at the left.", Needs::Nothing, ToggleFolders},
+    {kView, "&Folders",            "F9",           "Shows or hides the folders at the left.", Needs::Nothing, ToggleFolders, nullptr, false, HasFolders},
     {kView, "&Refresh",            "F5",           "Reads the folder again.", Needs::Nothing, OfBrowser<&BrowserPage::Reload>},
 
     {kGo, "&Back",                 "Alt+Left",     "Goes to the folder before this one.", Needs::Nothing, OfBrowser<&BrowserPage::GoBack>},
@@ -153,6 +160,7 @@ constexpr Command kCommands[] = {
     {kFunctions, nullptr},
     {kFunctions, "C&opy to...",    "F7",           "Copies the selected files to a folder.", Needs::Item, CopySelectionTo, "copy", true},
     {kFunctions, "&Move to...",    "F6",           "Moves the selected files to a folder.", Needs::Item, MoveSelectionTo, "move", true},
+    {kFunctions, "&Rename...",     "Shift+F2",     "Numbers the selected files.", Needs::Files, RenameSelectionSequentially, "rename", true},
     {kFunctions, "&Delete",        "Delete",       "Moves the selected files to the trash.", Needs::Item, TrashSelection, "trash", true},
     {kFunctions, "Delete for &good...", "Shift+Delete", "Deletes the selected files; this cannot be undone.", Needs::Item, DeleteSelection},
 

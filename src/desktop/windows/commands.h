@@ -29,6 +29,7 @@ struct Command {
   void (*run)(MainFrame& frame) = nullptr;
   const char* symbol = nullptr;      // of the button in the toolbar (bitmaps.cpp), null for no button
   bool inContextMenu = false;        // of a file in a browser
+  bool (*checked)(const MainFrame& frame) = nullptr;  // whether its menu item has a mark; null for one that never has
 };
 
 std::span<const Command> Commands();

@@ -1,10 +1,9 @@
 #include "desktop/windows/folder_tree.h"
 
-#include <wx/imaglist.h>
+#include <wx/app.h>
 
 #include <algorithm>
-#include <memory>
-#include <vector>
+#include <thread>
 
 #include "desktop/natural_order.h"
 #include "desktop/windows/bitmaps.h"
@@ -40,10 +39,18 @@ FolderTree::FolderTree(wxWindow* parent, std::function<void(const std::string&)>
   if (!home.empty()) SetItemImage(AddPlace("Home", home), 1);
   if (!pictures.empty() && pictures != home) AddPlace("Pictures", pictures);
   AddPlace("File system", std::string(1, platform::kSeparator));
-  Bind(wxEVT_TREE_ITEM_EXPANDING, [this](wxTreeEvent& event) { Fill(event.GetItem()); });
+  // What is not read yet opens when it has been.
+  Bind(wxEVT_TREE_ITEM_EXPANDING, [this](wxTreeEvent& event) {
+    if (GetChildrenCount(event.GetItem(), false) > 0) return;
+    opening_.insert(FolderOf(event.GetItem()));
+    Fill(event.GetItem());
+    event.Veto();
+  });
   Bind(wxEVT_TREE_SEL_CHANGED, [this](wxTreeEvent& event) {
     const std::string folder = FolderOf(event.GetItem());
-    if (!following_ && !folder.empty()) chosen_(folder);
+    if (following_ || folder.empty()) return;
+    followed_ = folder;
+    chosen_(folder);
   });
 }
 
@@ -67,51 +74,79 @@ void FolderTree::Fill(const wxTreeItemId& item) {
   auto* data = static_cast<FolderData*>(GetItemData(item));
   if (data == nullptr || data->filled) return;
   data->filled = true;
-  DeleteChildren(item);
-  std::vector<std::string> names;
-  for (const platform::FolderEntry& entry : platform::ListFolder(data->folder).value_or(std::vector<platform::FolderEntry>())) {
-    if (entry.kind == platform::FileKind::Folder && !entry.name.starts_with('.')) names.push_back(entry.name);
-  }
-  std::sort(names.begin(), names.end(), [](const auto& a, const auto& b) { return CompareNatural(a, b) < 0; });
-  for (const std::string& name : names) {
-    const wxTreeItemId child = AppendItem(item, Shown(name), 0, -1, new FolderData(platform::JoinFolder(data->folder, name)));
-    SetItemHasChildren(child);
-  }
-  if (names.empty()) SetItemHasChildren(item, false);
+  const std::weak_ptr<bool> alive = alive_;
+  std::thread([this, alive, folder = data->folder] {
+    std::vector<std::string> names;
+    for (const platform::FolderEntry& entry : platform::ListFolder(folder).value_or(std::vector<platform::FolderEntry>())) {
+      if (entry.kind == platform::FileKind::Folder && !entry.name.starts_with('.')) names.push_back(entry.name);
+    }
+    std::sort(names.begin(), names.end(), [](const auto& a, const auto& b) { return CompareNatural(a, b) < 0; });
+    wxTheApp->CallAfter([this, alive, folder, names = std::move(names)] {
+      if (!alive.expired()) TakeNames(folder, names);
+    });
+  }).detach();
 }
 
-wxTreeItemId FolderTree::FindChild(const wxTreeItemId& item, const std::string& folder) {
+void FolderTree::TakeNames(const std::string& folder, const std::vector<std::string>& names) {
+  // A folder may hang in the tree twice: under a place of its own and under the file system.
+  wxTreeItemIdValue cookie;
+  for (wxTreeItemId place = GetFirstChild(GetRootItem(), cookie); place.IsOk(); place = GetNextChild(GetRootItem(), cookie)) {
+    wxTreeItemId item = place;
+    while (item.IsOk() && FolderOf(item) != folder) item = FindChild(item, folder);
+    if (!item.IsOk() || !static_cast<FolderData*>(GetItemData(item))->filled || GetChildrenCount(item, false) > 0) continue;
+    for (const std::string& name : names) {
+      const wxTreeItemId child = AppendItem(item, Shown(name), 0, -1, new FolderData(platform::JoinFolder(folder, name)));
+      SetItemHasChildren(child);
+    }
+    SetItemHasChildren(item, !names.empty());
+    if (opening_.erase(folder) > 0 && !names.empty()) Expand(item);
+  }
+  FollowOn();
+}
+
+// Whether a folder is `above` or lies below it.
+static bool LiesIn(const std::string& folder, const std::string& above) {
+  return folder == above || (!above.empty() && folder.starts_with(platform::JoinFolder(above, "")));
+}
+
+wxTreeItemId FolderTree::FindChild(const wxTreeItemId& item, const std::string& folder) const {
   wxTreeItemIdValue cookie;
   for (wxTreeItemId child = GetFirstChild(item, cookie); child.IsOk(); child = GetNextChild(item, cookie)) {
-    if (FolderOf(child) == folder) return child;
+    if (LiesIn(folder, FolderOf(child))) return child;
   }
   return {};
 }
 
-void FolderTree::Follow(const std::string& folder) {
-  if (FolderOf(GetSelection()) == folder) return;
-  // From the place that is nearest above the folder, down.
+wxTreeItemId FolderTree::NearestItem(const std::string& folder) const {
   wxTreeItemId item;
   wxTreeItemIdValue cookie;
-  const auto isAbove = [&](const std::string& place) {
-    const std::string begin = place.ends_with(platform::kSeparator) ? place : place + platform::kSeparator;
-    return folder == place || folder.starts_with(begin);
-  };
   for (wxTreeItemId place = GetFirstChild(GetRootItem(), cookie); place.IsOk(); place = GetNextChild(GetRootItem(), cookie)) {
-    if (isAbove(FolderOf(place)) && (!item.IsOk() || FolderOf(place).size() > FolderOf(item).size())) item = place;
+    if (LiesIn(folder, FolderOf(place)) && (!item.IsOk() || FolderOf(place).size() > FolderOf(item).size())) item = place;
   }
-  if (!item.IsOk()) return;
-  following_ = true;
-  while (FolderOf(item) != folder) {
-    Fill(item);
-    const size_t from = FolderOf(item).size() + (FolderOf(item).ends_with(platform::kSeparator) ? 0 : 1);
-    const wxTreeItemId child = FindChild(item, folder.substr(0, folder.find(platform::kSeparator, from)));
+  while (item.IsOk() && FolderOf(item) != folder) {
+    const wxTreeItemId child = FindChild(item, folder);
     if (!child.IsOk()) break;
-    Expand(item);
     item = child;
   }
-  SelectItem(item);
-  EnsureVisible(item);
+  return item;
+}
+
+void FolderTree::Follow(const std::string& folder) {
+  if (followed_ == folder) return;
+  followed_ = folder;
+  FollowOn();
+}
+
+void FolderTree::FollowOn() {
+  const wxTreeItemId item = NearestItem(followed_);
+  if (!item.IsOk()) return;
+  following_ = true;
+  if (FolderOf(item) == followed_) {
+    if (GetSelection() != item) SelectItem(item);
+    EnsureVisible(item);
+  } else {
+    Fill(item);
+  }
   following_ = false;
 }
 

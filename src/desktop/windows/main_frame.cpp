@@ -17,6 +17,7 @@
 #include "desktop/windows/bitmaps.h"
 #include "desktop/windows/commands.h"
 #include "desktop/windows/file_actions.h"
+#include "desktop/windows/folder_drop.h"
 #include "desktop/windows/folder_tree.h"
 #include "desktop/windows/view_frame.h"
 #include "desktop/windows/wx_text.h"
@@ -70,7 +71,7 @@ void MainFrame::BuildMenus() {
       continue;
     }
     const wxString keys = *command.accelerator == '\0' ? wxString() : wxString("\t") + command.accelerator;
-    menu->Append(CommandId(command), command.text + keys, command.help);
+    menu->Append(CommandId(command), command.text + keys, command.help, command.checked != nullptr ? wxITEM_CHECK : wxITEM_NORMAL);
   }
   SetMenuBar(bar);
   const int last = kFirstCommandId + static_cast<int>(Commands().size()) - 1;
@@ -81,6 +82,7 @@ void MainFrame::BuildMenus() {
   Bind(wxEVT_UPDATE_UI, [this](wxUpdateUIEvent& event) {
     const Command& command = Commands()[static_cast<size_t>(event.GetId() - kFirstCommandId)];
     event.Enable(Enabled(command));
+    if (command.checked != nullptr) event.Check(command.checked(*this));
     if (command.needs != Needs::Undo && command.needs != Needs::Redo) return;
     const std::string name = command.needs == Needs::Undo ? files_->Undoable().UndoName() : files_->Undoable().RedoName();
     const wxString text = command.text + (name.empty() ? wxString() : " " + Shown(name)) + "\t" + command.accelerator;
@@ -133,6 +135,9 @@ void MainFrame::BuildPanes() {
   tree_ = new FolderTree(splitter_, [this](const std::string& folder) {
     if (BrowserPage* browser = Browser()) browser->Open(folder);
   });
+  tree_->SetDropTarget(new FolderDrop(
+      [this](const wxPoint& place) { return tree_->FolderAt(place); },
+      [this](const std::vector<std::string>& files, const std::string& folder, bool move) { DropFiles(files, folder, move); }));
   tabs_ = new wxAuiNotebook(splitter_, wxID_ANY, wxDefaultPosition, wxDefaultSize,
                             wxAUI_NB_TOP | wxAUI_NB_TAB_MOVE | wxAUI_NB_SCROLL_BUTTONS | wxAUI_NB_CLOSE_ON_ALL_TABS |
                                 wxAUI_NB_MIDDLE_CLICK_CLOSE | wxBORDER_NONE);

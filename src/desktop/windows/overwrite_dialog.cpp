@@ -93,12 +93,11 @@ wxSizer* OverwriteDialog::MakePreviews(const OverwriteQuestion& question, const 
     auto* head = new wxStaticText(this, wxID_ANY, title);
     head->SetFont(head->GetFont().Bold());
     column->Add(head, wxSizerFlags().CenterHorizontal());
-    const wxSize side = FromDIP(wxSize(kPaneSide, kPaneSide * 3 / 4));
+    const wxSize side = FromDIP(wxSize(kPaneSide, kPaneSide * 5 / 6));
     if (image.Empty()) {
       column->Add(side.x, side.y);
     } else {
       auto* picture = new wxStaticBitmap(this, wxID_ANY, BitmapOf(image), wxDefaultPosition, side, 0, title);
-      picture->SetScaleMode(wxStaticBitmap::Scale_AspectFit);
       column->Add(picture, wxSizerFlags(1).Expand().Border(wxTOP | wxBOTTOM, FromDIP(4)));
     }
     for (size_t from = 0; from < text.size();) {

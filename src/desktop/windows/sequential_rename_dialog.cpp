@@ -9,7 +9,6 @@
 #include <wx/sizer.h>
 #include <wx/spinctrl.h>
 #include <wx/stattext.h>
-#include <wx/weakref.h>
 #include <wx/wrapsizer.h>
 
 #include <optional>
@@ -221,12 +220,9 @@ void RenameSelectionSequentially(MainFrame& frame) {
   };
   BatchJob job;
   job.rename = SequentialRenameFromSettings();
-  const wxWeakRef<MainFrame> weak(&frame);
-  frame.Batches().Run(std::move(job), [batch = BatchFiles(files, files.size()), options, weak](BatchJob& running) {
+  frame.Batches().Run(std::move(job), [batch = BatchFiles(files, files.size()), options, &frame](BatchJob& running) {
     RunRename(batch, options, running);
-    wxTheApp->CallAfter([weak] {
-      if (weak) NoteRenames(*weak);
-    });
+    frame.CallAfter([&frame] { NoteRenames(frame); });
     return Status::Ok;
   });
 }

@@ -299,6 +299,7 @@ void ViewFrame::PaintCanvas() {
     const bool smooth = transform_.Scale() < 2 && settings.ResizeFilter != static_cast<int32_t>(3);
     DrawView(*BestSource(), transform_, static_cast<Color>(settings.ViewModeBackground), smooth, pixels);
     dc.DrawBitmap(BitmapOf(pixels, scale), 0, 0);
+    LogPaint();
   }
   if (!overlay_) return;
   const wxString text = Shown(StatusLine());
@@ -308,6 +309,14 @@ void ViewFrame::PaintCanvas() {
   dc.DrawRoundedRectangle(wxPoint(FromDIP(12), FromDIP(12)), extent, FromDIP(6));
   dc.SetTextForeground(*wxWHITE);
   dc.DrawText(text, FromDIP(22), FromDIP(17));
+}
+
+// Each picture and zoom once, with the time since the picture was asked for.
+void ViewFrame::LogPaint() {
+  const std::string shown = std::to_string(std::lround(transform_.Scale() * 100)) + "% " + shown_->wish.path;
+  if (shown == painted_) return;
+  painted_ = shown;
+  LogEvent("view-painted", shown + " ms=" + std::to_string(std::lround((platform::MonotonicSeconds() - keyTime_) * 1000)));
 }
 
 std::string ViewFrame::StatusLine() const {

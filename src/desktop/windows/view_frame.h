@@ -55,6 +55,7 @@ class ViewFrame : public wxFrame {
   void OnKey(wxKeyEvent& event);
   void ShowMenu(const wxPoint& place);
   void PaintCanvas();
+  void LogPaint();
   const PackedImage* BestSource() const;
 
   MainFrame& frame_;
@@ -66,6 +67,7 @@ class ViewFrame : public wxFrame {
   ViewTransform transform_;
   double keyTime_ = 0;  // when the picture that is awaited was asked for
   bool overlay_ = false;
+  std::string painted_;  // what the log was told of
   wxTimer slideTimer_;
   wxTimer pointerTimer_;
   Canvas* canvas_ = nullptr;

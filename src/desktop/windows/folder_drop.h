@@ -1,0 +1,27 @@
+#pragma once
+
+#include <wx/dnd.h>
+
+#include <functional>
+#include <string>
+#include <vector>
+
+namespace fotomill::desktop {
+
+// Files dropped on a window go to a folder: moved with Shift, copied with Ctrl, else as DropOptions says.
+class FolderDrop : public wxFileDropTarget {
+ public:
+  // The folder at a place of the window, empty for none.
+  using FolderAt = std::function<std::string(const wxPoint& place)>;
+  using Dropped = std::function<void(const std::vector<std::string>& files, const std::string& folder, bool move)>;
+  FolderDrop(FolderAt folderAt, Dropped dropped) : folderAt_(std::move(folderAt)), dropped_(std::move(dropped)) {}
+
+  wxDragResult OnDragOver(wxCoord x, wxCoord y, wxDragResult suggested) override;
+  bool OnDropFiles(wxCoord x, wxCoord y, const wxArrayString& names) override;
+
+ private:
+  const FolderAt folderAt_;
+  const Dropped dropped_;
+};
+
+}  // namespace fotomill::desktop
