@@ -34,7 +34,7 @@ bool NextPageName(BatchJob& job, std::string& path) {
   do {
     if (++job.cataloguePage >= kLastCataloguePage) return false;
     path = platform::JoinFolder(job.destinationFolder,
-                                CataloguePageName(settings.PrefixCatalog.view(), job.cataloguePage, ExtensionOfFormat(job)));
+                                CataloguePageName(PrefixOf(FileFunction::Catalog), job.cataloguePage, ExtensionOfFormat(job)));
   } while (platform::FileExists(path));
   return true;
 }
@@ -198,8 +198,8 @@ Status WriteCataloguePage(PictureRecord& page, const CataloguePageOptions& optio
     const FormatEntry& row = FormatRow(job.formatIndex);
     if (!CanWrite(row)) return Status::UnsupportedFunction;
     const auto deepest = static_cast<int32_t>(row.maxBits);
-    if (options.reduce && !options.dryRun && page.bitsPerPixel > deepest) RETURN_IF_BAD(ReduceColors(page, deepest));
-    if (options.dryRun && !options.reduce && page.bitsPerPixel > deepest) return Status::TooManyColors;
+    if (!options.reduce && page.bitsPerPixel > deepest) return Status::TooManyColors;
+    if (!options.dryRun) RETURN_IF_BAD(ReduceColors(page, deepest));
     const Status status = WritePage(page, options, destination, job);
     const bool lostRace = status == Status::ErrorCreatingFile && !destination.replace && platform::FileExists(path);
     if (lostRace) continue;  // the next number, then

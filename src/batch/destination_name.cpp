@@ -14,6 +14,17 @@ namespace {
 constexpr std::string_view kNotPlain = "The name cannot lead to another folder.";
 constexpr std::string_view kTooLong = "The path would be longer than 260 characters.";
 
+struct FunctionPrefix {
+  FileFunction function;
+  SettingPrefix Settings::* key;
+};
+constexpr FunctionPrefix kPrefixes[] = {
+    {FileFunction::Annotate, &Settings::PrefixAnnotate},   {FileFunction::Catalog, &Settings::PrefixCatalog},
+    {FileFunction::Crop, &Settings::PrefixCrop},           {FileFunction::Effects, &Settings::PrefixEffects},
+    {FileFunction::Filter, &Settings::PrefixFilter},       {FileFunction::Matt, &Settings::PrefixMatt},
+    {FileFunction::Transform, &Settings::PrefixTransform}, {FileFunction::Watermark, &Settings::PrefixWatermark},
+};
+
 bool FitsPath(const std::string& path) { return path.size() <= PathText::Capacity(); }
 
 // `path` with another base name.
@@ -125,6 +136,13 @@ std::string CasedExtension(std::string_view formatExtension, std::string_view so
     if (upper) extension[i] = UpperCase(extension[i]);
   }
   return extension;
+}
+
+std::string_view PrefixOf(FileFunction function) {
+  for (const FunctionPrefix& prefix : kPrefixes) {
+    if (prefix.function == function) return (settings.*prefix.key).view();
+  }
+  return {};
 }
 
 std::string_view ExtensionOfFormat(const BatchJob& job) {

@@ -18,7 +18,6 @@
 #include "picture/registry.h"
 #include "platform/clock.h"
 #include "platform/files.h"
-#include "platform/folders.h"
 #include "platform/paths.h"
 #include "platform/process.h"
 #include "platform/volumes.h"
@@ -50,7 +49,8 @@ FileOutcome Failure(const BatchFile& file, Status status, std::string hint = {})
 class Batch {
  public:
   Batch(std::span<const BatchFile> files, const BatchFunction& function, BatchJob& job)
-      : files_(files), function_(function), job_(job), asksEveryName_(AsksEveryName(job)), outcomes_(files.size()) {
+      : files_(files), function_(function), job_(job),
+        prefix_(function.prefix ? *function.prefix : std::string(PrefixOf(function.history))), asksEveryName_(AsksEveryName(job)), outcomes_(files.size()) {
     for (const BatchFile& file : files_) {
       if (file.status == Status::Ok) names_.AddSource(file.name, Planned(file));
     }
@@ -78,7 +78,7 @@ class Batch {
 
   std::string Planned(const BatchFile& file) const {
     if (!function_.out.empty()) return function_.out;
-    return PlannedDestination(file.name, function_.keepTree ? file.below : std::string(), function_.prefix, job_);
+    return PlannedDestination(file.name, function_.keepTree ? file.below : std::string(), prefix_, job_);
   }
 
   // On any thread: one file from its source to its output.
@@ -113,7 +113,7 @@ class Batch {
 
   void NoteUse(const std::string& source) {
     if ((settings.FileHistoryFunctions >> static_cast<int32_t>(function_.history) & 1) == 0) return;
-    job_.uses.push_back({platform::AbsolutePath(source), function_.history, kOwnTime,
+    job_.uses.push_back({names_.Key(source), function_.history, kOwnTime,
                          static_cast<int32_t>(platform::Now()), false});
   }
 
@@ -347,6 +347,7 @@ class Batch {
   const std::span<const BatchFile> files_;
   const BatchFunction& function_;
   BatchJob& job_;
+  const std::string prefix_;
   const bool asksEveryName_;
   std::vector<std::unique_ptr<FileOutcome>> outcomes_;  // of files that are done and not yet reported
   OrderedRun* run_ = nullptr;

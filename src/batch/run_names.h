@@ -31,6 +31,9 @@ class RunNames {
   // The same, or there is a file of that name.
   bool Taken(const std::string& path, const std::string& source) const;
 
+  // The path made absolute, by which files are compared.
+  std::string Key(const std::string& path) const;
+
   // Gives a path to an output.
   void Give(const std::string& path);
   // The output was not written: its name is free again.
@@ -42,8 +45,6 @@ class RunNames {
   bool MakeVariant(std::string& path, int64_t first, int64_t last, const TakenTest& taken);
 
  private:
-  std::string Key(const std::string& path) const;
-
   std::string folder_;  // what relative paths are relative to
   std::unordered_map<std::string, uint32_t> sources_;  // how often each is there
   std::unordered_map<std::string, uint32_t> planned_;

@@ -90,6 +90,7 @@ constexpr const char* kBash = R"sh(_fotomill() {
     -t|--to) COMPREPLY=($(compgen -W '@EXTENSIONS@' -- "$current")); return ;;
     --color) COMPREPLY=($(compgen -W 'auto always never' -- "$current")); return ;;
     --progress) COMPREPLY=($(compgen -W 'auto never' -- "$current")); return ;;
+    --frame) COMPREPLY=($(compgen -W 'none raised flat' -- "$current")); return ;;
     --overwrite) COMPREPLY=($(compgen -W 'ask replace keep-both skip' -- "$current")); return ;;
   esac
   if [[ $current == -* ]]; then
@@ -177,8 +178,11 @@ std::string FishScript(const std::vector<CommandWords>& commands) {
     CommandContext context;
     script += FishOptions("__fotomill_is " + command.name, CommandParser(FindCommand(command.name), context));
   }
-  return script + "complete -c fotomill -n '__fotomill_is convert' -s t -l to -x -a " +
-         FishQuoted(WritableExtensions()) + "\n";
+  for (const char* command : {"convert", "contact-sheet"}) {
+    script += std::string("complete -c fotomill -n '__fotomill_is ") + command + "' -s t -l to -x -a " +
+              FishQuoted(WritableExtensions()) + "\n";
+  }
+  return script;
 }
 
 int RunCompletion(const CommandContext& context) {

@@ -71,6 +71,7 @@ std::optional<std::string> TerminalPrompts::Ask(const std::string& question) {
   output_.MakeWay();
   std::fputs((question + " ").c_str(), context_.io.err);
   std::fflush(context_.io.err);
+  std::clearerr(context_.io.in);  // Ctrl-D ends an answer, not the terminal
   std::string line;
   int c = context_.io.in != stdin || platform::WaitForInput() ? std::fgetc(context_.io.in) : EOF;
   const bool ended = c == EOF;

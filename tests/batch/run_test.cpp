@@ -100,6 +100,23 @@ TEST_F(Run, SeveralAtATimeGiveWhatOneAfterTheOtherGives) {
   }
 }
 
+TEST_F(Run, FunctionsPutTheirPrefixInFrontBeforeNamesCollide) {
+  WriteBytes(In("a.bmp"), BitmapFile(8, 8, 24));
+  const BatchFile file{In("a.bmp"), {}, Status::Ok, {}};
+  const struct {
+    BatchFunction function;
+    const char* name;
+  } rows[] = {{{.history = FileFunction::Crop}, "Cropped_ a.pcx"},
+              {{.history = FileFunction::Crop}, "Cropped_ a [1].pcx"},
+              {{.history = FileFunction::Crop, .prefix = ""}, "a.pcx"},
+              {{.prefix = "Duplicate of "}, "Duplicate of a.pcx"}};
+  for (const auto& row : rows) {
+    BatchJob job = NewJob();
+    ASSERT_EQ(RunBatch({&file, 1}, row.function, job), Status::Ok);
+    EXPECT_EQ(job.progress.Lines()[0].text, file.name + " -> " + In("out/") + row.name);
+  }
+}
+
 TEST_F(Run, ASourceWaitsForTheOutputThatTakesItsPlace) {
   // Each file's output is the next one's source, and replaces it: the last output holds the first picture.
   for (const uint32_t jobs : {1u, 4u}) {
