@@ -27,6 +27,7 @@
 #include "formats/png_library.h"
 #include "formats/png_pixels.h"
 #include "platform/file_view.h"
+#include "processing/pixel_rows.h"
 
 namespace fotomill {
 
@@ -292,6 +293,10 @@ void StoreSamples(const uint8_t* source, size_t width, const PngReader&, uint8_t
   }
 }
 
+void StoreColors(const uint8_t* source, size_t width, const PngReader&, uint8_t* image, uint8_t*) {
+  SwapColors(source, width, image);
+}
+
 void StoreDeepGreys(const uint8_t* source, size_t width, const PngReader&, uint8_t* image, uint8_t*) {
   for (size_t x = 0; x < width; ++x) image[x] = HighByte(source + 2 * x);
 }
@@ -331,7 +336,7 @@ StoreFileRow FileRowStore(const PngReader& reader, const PngLayout& layout) {
       {PNG_COLOR_TYPE_PALETTE, 8, true, StorePaletteAlpha},
       {PNG_COLOR_TYPE_GRAY_ALPHA, 8, false, StoreSamples<2, 1>},
       {PNG_COLOR_TYPE_GRAY_ALPHA, 16, false, StoreSamples<2, 2>},
-      {PNG_COLOR_TYPE_RGB, 8, false, StoreSamples<3, 1>},
+      {PNG_COLOR_TYPE_RGB, 8, false, StoreColors},
       {PNG_COLOR_TYPE_RGB, 16, false, StoreSamples<3, 2>},
       {PNG_COLOR_TYPE_RGB_ALPHA, 8, false, StoreSamples<4, 1>},
       {PNG_COLOR_TYPE_RGB_ALPHA, 16, false, StoreSamples<4, 2>},

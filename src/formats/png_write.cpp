@@ -10,6 +10,7 @@
 #include "formats/png.h"
 #include "formats/png_deflate.h"
 #include "formats/png_library.h"
+#include "processing/pixel_rows.h"
 #include "processing/promote.h"
 
 namespace fotomill {
@@ -101,16 +102,6 @@ void SetHeader(const PngWriter& writer, const PictureRecord& picture) {
   }
 }
 
-// Blue, green, red to red, green, blue.
-void SwapColors(const uint8_t* source, uint8_t* target, int32_t width) {
-  for (int32_t x = 0; x < width; ++x, source += 3, target += 3) {
-    const uint8_t blue = source[0], green = source[1], red = source[2];
-    target[0] = red;
-    target[1] = green;
-    target[2] = blue;
-  }
-}
-
 // A row of red, green, blue, alpha. The colours are put at its end first and go to their places from the left on.
 void MergeRow(const BgrRows& colors, const PackedImage& alpha, int32_t y, uint8_t* target) {
   const auto width = static_cast<size_t>(alpha.Width());
@@ -139,7 +130,7 @@ Status WritePixels(const PictureRecord& picture, ByteWriter& out) {
     if (!picture.alpha.Empty()) {
       MergeRow(colors, picture.alpha, y, row);
     } else if (image.Bits() == 24) {
-      SwapColors(image.Row(y).data(), row, width);
+      SwapColors(image.Row(y).data(), static_cast<size_t>(width), row);
     } else {
       std::memcpy(row, image.Row(y).data(), rows.rowBytes);
     }

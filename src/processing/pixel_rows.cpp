@@ -110,9 +110,29 @@ BYTE_SHUFFLE size_t DropFourthFast(const uint8_t* bgrx, size_t count, uint8_t* b
   return x;
 }
 
+// Five pixels at a time; the store writes a byte too many, so the last pixels are left.
+BYTE_SHUFFLE size_t SwapColorsFast(const uint8_t* source, size_t count, uint8_t* target) {
+  const __m128i indices = _mm_setr_epi8(2, 1, 0, 5, 4, 3, 8, 7, 6, 11, 10, 9, 14, 13, 12, kNone);
+  size_t x = 0;
+  for (; x + 6 <= count; x += 5) Store(target + 3 * x, _mm_shuffle_epi8(Load(source + 3 * x), indices));
+  return x;
+}
+
 #endif
 
 }  // namespace
+
+void SwapColors(const uint8_t* source, size_t count, uint8_t* target) {
+  size_t x = 0;
+#ifdef BYTE_SHUFFLE
+  if (CanShuffleBytes()) x = SwapColorsFast(source, count, target);
+#endif
+  for (; x < count; ++x) {
+    target[3 * x] = source[3 * x + 2];
+    target[3 * x + 1] = source[3 * x + 1];
+    target[3 * x + 2] = source[3 * x];
+  }
+}
 
 void SplitColors(const uint8_t* bgr, size_t count, uint8_t* blue, uint8_t* green, uint8_t* red) {
   size_t x = 0;

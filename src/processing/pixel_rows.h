@@ -12,6 +12,9 @@ namespace fotomill {
 void SplitColors(const uint8_t* bgr, size_t count, uint8_t* blue, uint8_t* green, uint8_t* red);
 void MergeColors(const uint8_t* blue, const uint8_t* green, const uint8_t* red, size_t count, uint8_t* bgr);
 
+// Pixels of blue, green, red to red, green, blue, or the other way round.
+void SwapColors(const uint8_t* source, size_t count, uint8_t* target);
+
 // Pixels of blue, green, red and a fourth byte into pixels without it, and a plane of the fourth bytes; back again.
 void DropFourth(const uint8_t* bgrx, size_t count, uint8_t* bgr);
 void SplitAlpha(const uint8_t* bgra, size_t count, uint8_t* bgr, uint8_t* alpha);

@@ -28,6 +28,8 @@ TEST(PixelRows, TakeApartAndPutTogether) {
     EXPECT_EQ(red, Every(3, 2, colors));
     MergeColors(blue.data(), green.data(), red.data(), count, merged.data());
     EXPECT_EQ(merged, colors);
+    SwapColors(colors.data(), count, merged.data());
+    for (size_t i = 0; i < 3; ++i) EXPECT_EQ(Every(3, i, merged), Every(3, 2 - i, colors));
 
     SplitAlpha(four.data(), count, three.data(), alpha.data());
     for (size_t i = 0; i < 3; ++i) EXPECT_EQ(Every(3, i, three), Every(4, i, four));
