@@ -55,14 +55,19 @@ int Compare(const HistoryRow& a, const HistoryRow& b, int32_t column) {
 
 std::span<const HistoryColumnFacts> HistoryColumns() { return kColumns; }
 
-void FileHistoryList::Take() {
+bool FileHistoryList::Take() {
   rows_.clear();
+  ClearFileHistory();
+  const bool read = LoadFileHistory();
   for (size_t i = 0; i < FileHistoryCount(); ++i) {
     const FileHistoryEntry entry = FileHistoryAt(i);
     rows_.push_back({std::string(entry.path), entry.function, entry.created, entry.accessed, entry.size});
   }
+  ClearFileHistory();
   column_ = std::clamp(settings.FileHistorySortMode, 0, static_cast<int32_t>(std::size(kColumns)) - 1);
   Sort();
+  const std::string path = FileHistoryPath();
+  return read || settings.FileHistoryEnable == 0 || path.empty() || !platform::FileExists(path);
 }
 
 void FileHistoryList::SortBy(int32_t column) {
@@ -91,20 +96,17 @@ std::string FileHistoryList::Cell(size_t row, size_t column) const {
 }
 
 bool FileHistoryList::Remove(std::vector<size_t> rows) {
+  std::vector<FileUse> uses;
+  for (const size_t row : rows) uses.push_back({.path = rows_[row].path, .removed = true});
+  if (UpdateFileHistory(uses) != HistoryUpdate::Done) return false;
   std::ranges::sort(rows, std::greater<>());
-  for (const size_t row : rows) {
-    (void)RemoveFromFileHistory(rows_[row].path);
-    rows_.erase(rows_.begin() + static_cast<std::ptrdiff_t>(row));
-  }
-  const bool saved = SaveFileHistory();
-  (void)LoadFileHistory();
-  return saved;
+  for (const size_t row : rows) rows_.erase(rows_.begin() + static_cast<std::ptrdiff_t>(row));
+  return true;
 }
 
 bool FileHistoryList::Clear() {
-  rows_.clear();
-  ClearFileHistory();
   const std::string path = FileHistoryPath();
+  rows_.clear();
   return path.empty() || !platform::FileExists(path) || platform::DeleteFile(path);
 }
 

@@ -29,8 +29,9 @@ struct HistoryRow {
 // The entries of the file history in the order of a column. Belongs to the main thread.
 class FileHistoryList {
  public:
-  // Takes up the history as it is now, and sorts it as FileHistorySortMode says.
-  void Take();
+  // Takes up the history as its file has it now, and sorts it as FileHistorySortMode says. False when there is a file that
+  // cannot be read as one.
+  bool Take();
   // Sorts by a column; the one that sorts already, the other way round. Times and sizes begin with the largest.
   void SortBy(int32_t column);
   int32_t SortColumn() const { return column_; }
@@ -40,9 +41,10 @@ class FileHistoryList {
   const HistoryRow& Row(size_t row) const { return rows_[row]; }
   std::string Cell(size_t row, size_t column) const;
 
-  // Takes entries out of the history and writes it. False when it could not be written; the entries are gone until then.
+  // Takes entries out of the history file; what other programs recorded meanwhile stays. False when it could not be
+  // written: the entries are still there.
   bool Remove(std::vector<size_t> rows);
-  // Forgets everything and deletes the history file. False when it could not be deleted.
+  // Deletes the history file. False when it could not be deleted.
   bool Clear();
 
  private:

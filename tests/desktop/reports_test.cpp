@@ -125,11 +125,12 @@ TEST(HistoryDates, EachStyle) {
 
 TEST_F(Reports, HistorySortsRemovesAndForgets) {
   settings.FileHistoryFunctions = -1;
-  ASSERT_TRUE(RecordFileHistory(Sample("a10.bmp"), FileFunction::Convert, 300, 100));
-  ASSERT_TRUE(RecordFileHistory(Sample("a2.bmp"), FileFunction::View, 100, 300));
-  ASSERT_TRUE(RecordFileHistory(Sample("B.bmp"), FileFunction::Crop, 200, 200));
+  const FileUse uses[] = {{Sample("a10.bmp"), FileFunction::Convert, 300, 100},
+                          {Sample("a2.bmp"), FileFunction::View, 100, 300},
+                          {Sample("B.bmp"), FileFunction::Crop, 200, 200}};
+  ASSERT_EQ(UpdateFileHistory(uses), HistoryUpdate::Done);
   FileHistoryList list;
-  list.Take();
+  EXPECT_TRUE(list.Take());
   const auto names = [&] {
     std::vector<std::string> shown;
     for (size_t row = 0; row < list.Count(); ++row) shown.push_back(list.Cell(row, choice::kColumnName));
@@ -145,13 +146,15 @@ TEST_F(Reports, HistorySortsRemovesAndForgets) {
   EXPECT_EQ(list.Cell(1, choice::kColumnSize), "50,678");
   EXPECT_EQ(list.Cell(1, choice::kColumnPath), folder_.Path() + "/");
 
+  const FileUse later{Sample("c.bmp"), FileFunction::Crop};
+  ASSERT_EQ(UpdateFileHistory({&later, 1}), HistoryUpdate::Done);
   EXPECT_TRUE(list.Remove({0, 2}));
   EXPECT_THAT(names(), ElementsAre("B.bmp"));
-  EXPECT_EQ(FileHistoryCount(), 1u);
-  EXPECT_THAT(test::ReadText(FileHistoryPath()), testing::AllOf(HasSubstr("B.bmp"), testing::Not(HasSubstr("a2"))));
+  EXPECT_THAT(test::ReadText(FileHistoryPath()), testing::AllOf(HasSubstr("B.bmp"), HasSubstr("c.bmp"), testing::Not(HasSubstr("a2"))));
   EXPECT_TRUE(list.Clear());
   EXPECT_FALSE(platform::FileExists(FileHistoryPath()));
-  EXPECT_EQ(FileHistoryCount(), 0u);
+  test::WriteText(FileHistoryPath(), "no history at all");
+  EXPECT_FALSE(list.Take());
 }
 
 TEST_F(Reports, CompactionTellsWhatItDid) {

@@ -76,7 +76,8 @@ FileHistoryBox::FileHistoryBox(MainFrame& frame)
   SetSizer(column);
   Layout();
   AddColumns();
-  history_.Take();
+  frame_.FlushUses();
+  readable_ = history_.Take();
   Refill();
   SetEscapeId(wxID_CLOSE);
   CentreOnParent();
@@ -135,10 +136,11 @@ void FileHistoryBox::UpdateControls() {
   wxString text = settings.FileHistoryEnable == 0 ? wxString("The file history is switched off; Options switches it on.")
                                                   : wxString::Format(history_.Count() == 1 ? "%zu file" : "%zu files", history_.Count());
   if (settings.FileHistoryEnable != 0 && selected > 1) text += wxString::Format(", %zu selected", selected);
+  if (!readable_) text = "The history file is there but cannot be read as one. Clear deletes it.";
   count_->SetLabel(text);
   for (const wxWindowID id : {wxID_OPEN, wxID_UP}) FindWindow(id)->Enable(selected == 1);
   FindWindow(wxID_DELETE)->Enable(selected > 0);
-  FindWindow(wxID_CLEAR)->Enable(history_.Count() > 0);
+  FindWindow(wxID_CLEAR)->Enable(history_.Count() > 0 || !readable_);
 }
 
 std::vector<size_t> FileHistoryBox::SelectedRows() const {
@@ -221,13 +223,14 @@ void FileHistoryBox::RemoveSelected() {
   const wxString what = rows.size() == 1 ? "\"" + Shown(history_.Cell(rows.front(), choice::kColumnName)) + "\""
                                          : wxString::Format("%zu entries", rows.size());
   if (!Confirm("Take " + what + " out of the file history?", "Remove")) return;
-  if (!history_.Remove(rows)) wxMessageBox("The history file could not be written; the entries will be back.", kTitle, wxOK | wxICON_WARNING, this);
+  if (!history_.Remove(rows)) wxMessageBox("The history file could not be written. The entries stay.", kTitle, wxOK | wxICON_WARNING, this);
   Refill();
 }
 
 void FileHistoryBox::ClearAll() {
   if (!Confirm("Forget all files of the file history?", "Clear")) return;
-  if (!history_.Clear()) wxMessageBox("The history file could not be deleted.", kTitle, wxOK | wxICON_WARNING, this);
+  readable_ = history_.Clear();
+  if (!readable_) wxMessageBox("The history file could not be deleted.", kTitle, wxOK | wxICON_WARNING, this);
   Refill();
 }
 
@@ -235,7 +238,7 @@ void FileHistoryBox::Options() {
   if (!ShowFileHistorySetup(this)) return;
   list_->SetWindowStyleFlag((list_->GetWindowStyleFlag() & ~wxDV_HORIZ_RULES) |
                             (settings.FileHistoryListRuleEnable != 0 ? wxDV_HORIZ_RULES : 0));
-  history_.Take();
+  readable_ = history_.Take();
   Refill();
 }
 

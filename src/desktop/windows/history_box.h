@@ -38,6 +38,7 @@ class FileHistoryBox : public wxDialog {
 
   MainFrame& frame_;
   FileHistoryList history_;
+  bool readable_ = true;
   HistoryThumbnails thumbnails_;
   wxDataViewCtrl* list_ = nullptr;
   wxStaticText* count_ = nullptr;

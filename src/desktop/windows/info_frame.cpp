@@ -10,6 +10,7 @@
 
 #include "catalog/file_history.h"
 #include "desktop/event_log.h"
+#include "desktop/windows/main_frame.h"
 #include "desktop/windows/report_tree.h"
 #include "desktop/windows/text_actions.h"
 #include "desktop/windows/wx_text.h"
@@ -28,8 +29,9 @@ constexpr int kProgressMs = 200;
 
 }  // namespace
 
-InfoFrame::InfoFrame(wxWindow* parent, std::vector<std::string> paths)
+InfoFrame::InfoFrame(MainFrame& frame, wxWindow* parent, std::vector<std::string> paths)
     : wxFrame(parent, wxID_ANY, TitleOf(paths), wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE | wxFRAME_FLOAT_ON_PARENT, "InfoBox"),
+      frame_(frame),
       paths_(std::move(paths)) {
   const int gap = FromDIP(10);
   auto* panel = new wxPanel(this);
@@ -93,9 +95,11 @@ InfoFrame::InfoFrame(wxWindow* parent, std::vector<std::string> paths)
 
 void InfoFrame::Finished() {
   timer_.Stop();
+  std::vector<FileUse> uses;
   for (const FileInfo& file : files_) {
-    if (file.status == Status::Ok) (void)RecordFileHistory(file.path, FileFunction::GetInfo);
+    if (file.status == Status::Ok) uses.push_back({.path = file.path, .function = FileFunction::GetInfo});
   }
+  frame_.NoteUses(uses);
   if (list_ != nullptr) {
     wxArrayString names;
     names.Add(wxString::Format("All %zu files", files_.size()));

@@ -15,18 +15,20 @@ class wxStaticText;
 
 namespace fotomill::desktop {
 
+class MainFrame;
 class ReportTree;
 
 // "Get info": the facts of one file, or of several with their totals and differences. Files are read apart.
 class InfoFrame : public wxFrame {
  public:
-  InfoFrame(wxWindow* parent, std::vector<std::string> paths);
+  InfoFrame(MainFrame& frame, wxWindow* parent, std::vector<std::string> paths);
 
  private:
   void Finished();
   void ShowChoice();  // what the list at the left has selected
   std::string WholeText() const;
 
+  MainFrame& frame_;
   const std::vector<std::string> paths_;
   std::vector<FileInfo> files_;        // written apart, then read here
   std::vector<InfoSection> summary_;

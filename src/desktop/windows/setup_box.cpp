@@ -1,5 +1,6 @@
 #include "desktop/windows/setup_box.h"
 
+#include <wx/app.h>
 #include <wx/button.h>
 #include <wx/filedlg.h>
 #include <wx/listbox.h>
@@ -16,7 +17,9 @@
 #include "core/data_folder.h"
 #include "desktop/configuration_transfer.h"
 #include "desktop/event_log.h"
+#include "desktop/windows/batch_runner.h"
 #include "desktop/windows/format_list.h"
+#include "desktop/windows/main_frame.h"
 #include "desktop/windows/wx_text.h"
 #include "platform/files.h"
 
@@ -27,9 +30,19 @@ namespace {
 constexpr const char* kSetupTitle = "Setup";
 constexpr const char* kTransferFiles = "Settings (*.ini)|*.ini|All files|*";
 
+// Settings never change during a batch. False after a message when one is running.
+bool MayChangeSettings(wxWindow& window) {
+  auto* const frame = dynamic_cast<MainFrame*>(wxTheApp->GetTopWindow());
+  if (frame == nullptr || !frame->Batches().Running()) return true;
+  wxMessageBox("A batch is running with the settings as they are. Change them when it has ended.", kSetupTitle, wxOK | wxICON_INFORMATION,
+               &window);
+  return false;
+}
+
 // Takes up what the controls hold and saves it. False after a message about the control that holds something else.
 bool TakeSettings(wxWindow& window, const BoundControls& controls, const std::function<void(uint32_t)>& show, bool& changed) {
   const RegistryDestinations destinations;
+  if (!MayChangeSettings(window)) return false;
   if (const auto fault = ReadSetupDialog(controls, destinations)) {
     show(fault->control);
     wxMessageBox(Shown(fault->message), kSetupTitle, wxOK | wxICON_WARNING, &window);
@@ -207,6 +220,7 @@ void SetupBox::ResetPage() {
 }
 
 void SetupBox::Import() {
+  if (!MayChangeSettings(*this)) return;
   wxFileDialog dialog(this, "Import settings", wxEmptyString, wxEmptyString, kTransferFiles, wxFD_OPEN | wxFD_FILE_MUST_EXIST);
   if (dialog.ShowModal() != wxID_OK) return;
   const Transfer transfer = ImportConfiguration(Utf8(dialog.GetPath()));

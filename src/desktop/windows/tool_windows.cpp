@@ -19,7 +19,7 @@ void ShowSetup(MainFrame& frame) {
 
 void ShowInfo(MainFrame& frame) {
   std::vector<std::string> files = frame.SelectedFiles();
-  if (!files.empty()) (new InfoFrame(&frame, std::move(files)))->Show();
+  if (!files.empty()) (new InfoFrame(frame, &frame, std::move(files)))->Show();
 }
 
 void ShowExif(MainFrame& frame) {

@@ -352,7 +352,7 @@ void ViewFrame::ToggleSlideshow() {
   slideTimer_.Start(kSlideMs);
 }
 
-void ViewFrame::ShowInfoWindow() { (new InfoFrame(this, {list_[place_]}))->Show(); }
+void ViewFrame::ShowInfoWindow() { (new InfoFrame(frame_, this, {list_[place_]}))->Show(); }
 
 void ViewFrame::ToggleOverlay() {
   overlay_ = !overlay_;
