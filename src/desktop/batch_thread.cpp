@@ -63,8 +63,8 @@ class BatchThread::Box : public ProgressBox {
     return true;
   }
   void ShowLine(const ProgressLine& line, const FileOutcome* outcome) override {
-    batch_.Tell([&windows = batch_.windows_, line, source = outcome == nullptr ? std::string() : outcome->source] {
-      windows.BatchLine(line, source);
+    batch_.Tell([&windows = batch_.windows_, line, copy = outcome == nullptr ? FileOutcome() : *outcome] {
+      windows.BatchLine(line, copy);
     });
   }
   void ShowStatus(const std::string& status) override {

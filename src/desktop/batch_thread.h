@@ -28,8 +28,8 @@ class BatchWindows {
  public:
   virtual ~BatchWindows() = default;
   virtual void BatchOpened() = 0;
-  // `source` is the file that the line is about, empty for lines about the batch.
-  virtual void BatchLine(const ProgressLine& line, const std::string& source) = 0;
+  // `outcome` is that of the file that the line is about, empty for lines about the batch.
+  virtual void BatchLine(const ProgressLine& line, const FileOutcome& outcome) = 0;
   virtual void BatchStatus(const std::string& status) = 0;
   virtual void BatchProgress(uint32_t done, uint32_t count) = 0;
   // The end: the box stays open to be read, or goes.

@@ -103,11 +103,17 @@ Outcome TrashOne(const std::string& path) {
   return platform::MoveToTrash(path) ? Outcome() : Outcome("There is no trash for it; Shift+Delete deletes for good.");
 }
 
+Outcome Restore(const std::string& path) {
+  if (platform::FileExists(path)) return kTaken;
+  return platform::RestoreFromTrash(path) ? Outcome() : Outcome("It is not in the trash any more.");
+}
+
 Outcome DoStep(DeedKind kind, const FileStep& step) {
   switch (kind) {
     case DeedKind::Rename:
     case DeedKind::Move: return MoveOne(step.from, step.to);
     case DeedKind::Copy: return CopyTree(step.from, step.to, 0);
+    case DeedKind::Create: return Restore(step.to);
     case DeedKind::Trash: break;
   }
   return TrashOne(step.from);
@@ -128,10 +134,10 @@ Outcome UndoStep(DeedKind kind, const FileStep& step) {
     case DeedKind::Rename:
     case DeedKind::Move: return MoveOne(step.to, step.from);
     case DeedKind::Copy: return RemoveCopy(step);
+    case DeedKind::Create: return TrashOne(step.to);
     case DeedKind::Trash: break;
   }
-  if (platform::FileExists(step.from)) return kTaken;
-  return platform::RestoreFromTrash(step.from) ? Outcome() : Outcome("It is not in the trash any more.");
+  return Restore(step.from);
 }
 
 const char* KindName(DeedKind kind) {
@@ -139,6 +145,7 @@ const char* KindName(DeedKind kind) {
     case DeedKind::Rename: return "rename";
     case DeedKind::Move: return "move";
     case DeedKind::Copy: return "copy";
+    case DeedKind::Create: return "output";
     case DeedKind::Trash: break;
   }
   return "deletion";
@@ -204,8 +211,8 @@ DeedResult DeleteForGood(const std::vector<std::string>& paths, const DeedProgre
 }
 
 std::string DeedName(const FileDeed& deed) {
-  const std::string name = std::string(KindName(deed.kind)) + " of ";
-  if (deed.steps.size() == 1) return name + std::string(platform::FileNameOf(deed.steps[0].from));
+  std::string name = std::string(KindName(deed.kind)) + " of ";
+  if (deed.steps.size() == 1) return name.append(platform::FileNameOf(deed.steps[0].from));
   return name + std::to_string(deed.steps.size()) + " files";
 }
 

@@ -9,7 +9,13 @@
 namespace fotomill::desktop {
 
 // Things done to files that can be taken back.
-enum class DeedKind { Rename, Move, Copy, Trash };
+enum class DeedKind {
+  Rename,
+  Move,
+  Copy,
+  Trash,
+  Create,  // a function wrote `to` from `from`, in nobody's place
+};
 
 struct FileStep {
   std::string from;
@@ -43,7 +49,8 @@ FileDeed PlanDeed(DeedKind kind, const std::vector<std::string>& paths, const st
 // Does the steps of a deed. Nothing is ever replaced: where a name is taken meanwhile the step fails. Files keep their
 // times. May take long; any thread.
 DeedResult CarryOut(const FileDeed& deed, const DeedProgress& progress = {});
-// Takes a deed back, last step first: files go back to where they were, copies that nobody has changed go to the trash.
+// Takes a deed back, last step first: files go back to where they were, copies that nobody has changed and outputs go to
+// the trash.
 DeedResult TakeBack(const FileDeed& deed, const DeedProgress& progress = {});
 
 // Deletes files for good, and folders with what is in them.

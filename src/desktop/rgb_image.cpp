@@ -13,6 +13,7 @@ namespace fotomill::desktop {
 
 namespace {
 
+// Red and blue change places.
 void SwapRow(const uint8_t* bgr, int32_t width, uint8_t* rgb) {
   for (int32_t x = 0; x < width; ++x, bgr += 3, rgb += 3) {
     rgb[0] = bgr[2];
@@ -62,6 +63,12 @@ Status ToRgb(const PackedImage& image, RgbImage& rgb) {
   RETURN_IF_BAD(rows.Open(image));
   if (!Reserve(rgb, image.Width(), image.Height())) return Status::MemoryAllocationError;
   for (int32_t y = 0; y < rgb.height; ++y) SwapRow(rows.Row(y), rgb.width, rgb.Row(y));
+  return Status::Ok;
+}
+
+Status ToPacked(const RgbImage& rgb, PackedImage& image) {
+  RETURN_IF_BAD(NewPackedImage(rgb.width, rgb.height, nullptr, 24, image));
+  for (int32_t y = 0; y < rgb.height; ++y) SwapRow(rgb.Row(y), rgb.width, image.Row(y).data());
   return Status::Ok;
 }
 

@@ -26,6 +26,9 @@ RgbImage FilledImage(int32_t width, int32_t height, Color color);
 // The pixels of a packed image of any depth. Statuses as NewPackedImage.
 Status ToRgb(const PackedImage& image, RgbImage& rgb);
 
+// And back: a packed image of 24 bits. Statuses as NewPackedImage.
+Status ToPacked(const RgbImage& rgb, PackedImage& image);
+
 // Turns a picture upright by its EXIF orientation, if ExifAdjustOrientation asks for it, composites its alpha plane onto
 // `background` (0x00BBGGRR) and brings it to 24 bits: what a window can show. Statuses of those steps.
 Status PrepareForDisplay(PictureRecord& picture, Color background);

@@ -60,6 +60,13 @@ def convert_and_collide(folder):
         desktop.wait(r"batch ended status=0")
         assert (out / "one.png").read_bytes() == b"old"
         assert sorted(path.name for path in out.iterdir()) == ["one.png", "three.png", "two.png"]
+        # What took nobody's place can be taken back.
+        desktop.focus("^Progress$")
+        desktop.key("Escape")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+z")
+        desktop.wait(r"files Undo output of one.bmp done=1")
+        assert sorted(path.name for path in out.iterdir()) == ["one.png", "two.png"]
 
 
 def errors_stay_and_abort_stops(folder):

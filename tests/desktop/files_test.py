@@ -44,6 +44,14 @@ def rename_delete_undo_paste(folder):
         desktop.wait(r"lines=2 .*listing=0 .*folder=.*other$")
         desktop.key("alt+Left")
         desktop.wait(r"lines=4 .*listing=0 .*folder=.*pictures$")
+        # Deleted while it is looked at: the next one comes.
+        desktop.key("Home", "Return")
+        desktop.wait(r"view place=1/4 .*status=0 .*a \[1\].bmp")
+        desktop.focus("View$")
+        desktop.key("Delete")
+        desktop.wait(r"view place=1/3 .*status=0 .*a.bmp")
+        desktop.wait(r"files Deletion of a \[1\].bmp done=1")
+        assert names(pictures) == ["a.bmp", "b [1].bmp", "b.bmp"], names(pictures)
 
 
 def rename_in_sequence(folder):

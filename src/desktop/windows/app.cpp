@@ -59,7 +59,7 @@ class App : public wxApp {
     auto* frame = new MainFrame;
     const bool restored = frame->RestoreSession();
     if (!restored || !argument_.empty()) {
-      frame->OpenTab(platform::IsFolder(start.folder) ? start.folder : platform::CurrentFolder());
+      frame->ShowFolder(platform::IsFolder(start.folder) ? start.folder : platform::CurrentFolder());
     }
     frame->Show();
     LogEvent("frame");

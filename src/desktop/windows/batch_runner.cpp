@@ -8,11 +8,13 @@
 #include "desktop/destination_choice.h"
 #include "desktop/event_log.h"
 #include "desktop/windows/destination_dialog.h"
+#include "desktop/windows/file_actions.h"
 #include "desktop/windows/main_frame.h"
 #include "desktop/windows/overwrite_dialog.h"
 #include "desktop/windows/progress_window.h"
 #include "desktop/windows/prompt_for_destination.h"
 #include "desktop/windows/wx_text.h"
+#include "platform/folders.h"
 #include "platform/paths.h"
 
 namespace fotomill::desktop {
@@ -42,6 +44,7 @@ void BatchRunner::Run(BatchJob job, BatchThread::Work work) {
 void BatchRunner::StartNext() {
   if (waiting_.empty()) return;
   CloseBox();
+  written_ = {DeedKind::Create, {}};
   Waiting next = std::move(waiting_.front());
   waiting_.pop_front();
   thread_->StartWork(std::move(next.job), std::move(next.work));
@@ -66,9 +69,11 @@ void BatchRunner::BatchOpened() {
   LogEvent("batch", "opened");
 }
 
-void BatchRunner::BatchLine(const ProgressLine& line, const std::string& source) {
+void BatchRunner::BatchLine(const ProgressLine& line, const FileOutcome& outcome) {
   LogEvent("batch-line", line.text);
-  if (box_ != nullptr) box_->AddLine(line, source);
+  if (box_ != nullptr) box_->AddLine(line, outcome.source);
+  const bool written = outcome.status == Status::Ok && !outcome.skipped && !outcome.replaced && !outcome.destination.empty();
+  if (written) written_.steps.push_back({outcome.source, platform::AbsolutePath(outcome.destination)});
 }
 
 void BatchRunner::BatchStatus(const std::string& status) {
@@ -92,6 +97,8 @@ void BatchRunner::BatchCloses() {
 void BatchRunner::BatchEnded(Status status, const BatchJob& job) {
   LogEvent("batch", "ended status=" + std::to_string(StatusNumber(status)));
   frame_.NoteUses(job.uses);
+  // Outputs, not files that were given other names.
+  if (job.formatIndex != kNoFormat) frame_.Files().NoteDone(std::exchange(written_, {}));
   if (job.filesChanged) frame_.FilesChanged();
   if (!frame_.IsActive() && (box_ == nullptr || !box_->IsActive())) frame_.RequestUserAttention(wxUSER_ATTENTION_INFO);
   if (status == Status::Ok) frame_.Tell(CountLine(job.progress.Files()));

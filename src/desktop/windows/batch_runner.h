@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "desktop/batch_thread.h"
+#include "desktop/file_deeds.h"
 
 namespace fotomill::desktop {
 
@@ -34,7 +35,7 @@ class BatchRunner : public wxEvtHandler, public BatchWindows {
   void CloseBox();
 
   void BatchOpened() override;
-  void BatchLine(const ProgressLine& line, const std::string& source) override;
+  void BatchLine(const ProgressLine& line, const FileOutcome& outcome) override;
   void BatchStatus(const std::string& status) override;
   void BatchProgress(uint32_t done, uint32_t count) override;
   void BatchStaysOpen(const ProgressModel& model) override;
@@ -51,6 +52,7 @@ class BatchRunner : public wxEvtHandler, public BatchWindows {
   MainFrame& frame_;
   std::deque<Waiting> waiting_;
   ProgressWindow* box_ = nullptr;
+  FileDeed written_;  // by the batch that runs, as far as it can be taken back
   std::unique_ptr<BatchThread> thread_;
 };
 

@@ -173,6 +173,15 @@ std::string MainFrame::CurrentFolder() const {
   return browser == nullptr ? platform::CurrentFolder() : browser->Model().Folder();
 }
 
+BrowserPage* MainFrame::ShowFolder(const std::string& folder) {
+  for (size_t tab = 0; tab < tabs_->GetPageCount(); ++tab) {
+    if (PageAt(tab)->Model().Folder() != folder) continue;
+    tabs_->SetSelection(tab);
+    return PageAt(tab);
+  }
+  return OpenTab(folder);
+}
+
 BrowserPage* MainFrame::OpenTab(const std::string& folder) {
   BrowserModes modes{settings.DefaultThumbnailMode, settings.DefaultViewMode, settings.DefaultSortMode};
   if (const BrowserPage* browser = Browser()) modes = browser->Model().Modes();

@@ -36,6 +36,8 @@ class MainFrame : public wxFrame, public BrowserHost {
   std::string CurrentFolder() const;
 
   BrowserPage* OpenTab(const std::string& folder);
+  // The tab that shows the folder, or another one.
+  BrowserPage* ShowFolder(const std::string& folder);
   // The tabs of the last run, where they are to be remembered. False when there are none.
   bool RestoreSession();
   void CloseTab();

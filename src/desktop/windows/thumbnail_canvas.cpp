@@ -25,7 +25,7 @@ namespace {
 
 constexpr int kPadding = 6;            // inside a cell, device-independent pixels
 constexpr int kListWidth = 240;        // of a line in the list of names
-constexpr size_t kMostBitmaps = 1500;  // kept for drawing
+constexpr double kBitmapBytes = 96e6;  // kept for drawing, beside the thumbnails themselves
 constexpr size_t kMostCutNames = 5000;
 constexpr double kTypingPause = 1.0;   // seconds after which typing begins anew
 constexpr size_t kPrecache = 256;      // thumbnails wanted beyond what is near
@@ -341,7 +341,8 @@ wxString ThumbnailCanvas::CutName(wxDC& dc, const std::string& name, int width) 
 const wxBitmap& ThumbnailCanvas::BitmapOfThumbnail(const ThumbnailPointer& thumbnail) {
   const auto found = bitmaps_.find(thumbnail.get());
   if (found != bitmaps_.end()) return found->second.bitmap;
-  if (bitmaps_.size() > kMostBitmaps) bitmaps_.clear();
+  const double side = square_ * GetContentScaleFactor();
+  if (static_cast<double>(bitmaps_.size()) * side * side * 7 > kBitmapBytes) bitmaps_.clear();
   return bitmaps_.try_emplace(thumbnail.get(), Drawn{thumbnail, BitmapOf(thumbnail->pixels, GetContentScaleFactor())})
       .first->second.bitmap;
 }

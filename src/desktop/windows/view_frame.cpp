@@ -3,6 +3,7 @@
 #include <wx/clipbrd.h>
 #include <wx/dcclient.h>
 #include <wx/menu.h>
+#include <wx/msgdlg.h>
 #include <wx/settings.h>
 
 #include <algorithm>
@@ -14,6 +15,7 @@
 #include "desktop/event_log.h"
 #include "desktop/windows/bitmaps.h"
 #include "desktop/windows/info_frame.h"
+#include "desktop/windows/file_actions.h"
 #include "desktop/windows/main_frame.h"
 #include "desktop/windows/wx_text.h"
 #include "platform/clock.h"
@@ -66,6 +68,7 @@ const ViewCommand kViewCommands[] = {
     {"In&formation",      "I",         {'I'},                           [](ViewFrame& view) { view.ToggleOverlay(); }},
     {"G&et info...",      "Alt+Enter", {},                              [](ViewFrame& view) { view.ShowInfoWindow(); }},
     {nullptr, nullptr, {}, nullptr},
+    {"&Delete",           "Del",       {WXK_DELETE},                    [](ViewFrame& view) { view.DeleteFile(); }},
     {"&Copy picture",     "Ctrl+C",    {WXK_CONTROL_C},                 [](ViewFrame& view) { view.CopyPicture(); }},
     {"&Close",            "Esc",       {WXK_ESCAPE, WXK_RETURN, WXK_NUMPAD_ENTER}, [](ViewFrame& view) { view.Leave(); }},
 };
@@ -190,8 +193,23 @@ void ViewFrame::ShowPlace() {
   if (const ViewPicturePointer ready = loader_->Find(WishOf(place_))) {
     TakePicture(ready);
   } else {
+    ShowPreview();
     UpdateTitle();
   }
+}
+
+// Until the picture is there its thumbnail stands in, where the browser has one.
+void ViewFrame::ShowPreview() {
+  preview_.Free();
+  const ThumbnailPointer thumbnail = frame_.Thumbnails().FindAny(list_[place_]);
+  if (thumbnail == nullptr || thumbnail->pixels.Empty() || ToPacked(thumbnail->pixels, preview_) != Status::Ok) return;
+  constexpr int32_t kUnknown = 16;  // times the thumbnail, where its picture's size is not known
+  const bool known = thumbnail->width > 0;
+  int32_t width = known ? thumbnail->width : preview_.Width() * kUnknown;
+  int32_t height = known ? thumbnail->height : preview_.Height() * kUnknown;
+  if ((width > height) != (preview_.Width() > preview_.Height())) std::swap(width, height);  // it was turned upright
+  transform_.SetPicture(width, height);
+  canvas_->Refresh();
 }
 
 // The picture itself, then two each way.
@@ -216,6 +234,7 @@ void ViewFrame::PictureCame() {
 void ViewFrame::TakePicture(ViewPicturePointer picture) {
   shown_ = std::move(picture);
   scaled_.reset();
+  preview_.Free();
   if (shown_->picture != nullptr) {
     transform_.SetPicture(shown_->picture->image.Width(), shown_->picture->image.Height());
     frame_.NoteUses({FileUse{list_[place_], FileFunction::View}});
@@ -253,7 +272,7 @@ void ViewFrame::PanBy(int stepsAcross, int stepsDown) {
 
 // The picture is drawn at once from what there is; a smaller scale then gets pixels that are made for it.
 void ViewFrame::TransformChanged() {
-  if (shown_ != nullptr && shown_->picture != nullptr && transform_.Scale() < 1) {
+  if (preview_.Empty() && shown_ != nullptr && shown_->picture != nullptr && transform_.Scale() < 1) {
     const PackedImage* source = BestSource();
     const bool exact = source->Width() == transform_.ShownWidth() && source->Height() == transform_.ShownHeight();
     if (!exact) scaler_->Request(shown_, transform_.ShownWidth(), transform_.ShownHeight());
@@ -285,7 +304,9 @@ void ViewFrame::PaintCanvas() {
   const double scale = canvas_->GetContentScaleFactor();
   const wxSize size = canvas_->DeviceSize();
   const wxColour background = ColourOf(settings.ViewModeBackground);
-  if (shown_ == nullptr || shown_->picture == nullptr || size.x < 1 || size.y < 1) {
+  const bool previewing = !preview_.Empty();
+  if (size.x < 1 || size.y < 1) return;
+  if (!previewing && (shown_ == nullptr || shown_->picture == nullptr)) {
     dc.SetBackground(wxBrush(background));
     dc.Clear();
     dc.SetTextForeground(*wxBLACK);
@@ -297,9 +318,9 @@ void ViewFrame::PaintCanvas() {
     pixels.height = size.y;
     pixels.bytes.resize(static_cast<size_t>(size.x) * static_cast<size_t>(size.y) * 3);
     const bool smooth = transform_.Scale() < 2 && settings.ResizeFilter != static_cast<int32_t>(3);
-    DrawView(*BestSource(), transform_, static_cast<Color>(settings.ViewModeBackground), smooth, pixels);
+    DrawView(previewing ? preview_ : *BestSource(), transform_, static_cast<Color>(settings.ViewModeBackground), smooth, pixels);
     dc.DrawBitmap(BitmapOf(pixels, scale), 0, 0);
-    LogPaint();
+    if (!previewing) LogPaint();
   }
   if (!overlay_) return;
   const wxString text = Shown(StatusLine());
@@ -364,6 +385,25 @@ void ViewFrame::Leave() {
   if (IsFullScreen()) return ToggleFullScreen();
   if (BrowserPage* browser = frame_.Browser()) browser->FocusName(std::string(platform::FileNameOf(list_[place_])));
   Close();
+}
+
+void ViewFrame::DeleteFile() {
+  const std::string path = list_[place_];
+  if (settings.PromptDeleteFromView != 0) {
+    wxMessageDialog dialog(this, "Move " + Shown(platform::FileNameOf(path)) + " to the trash?", "Delete", wxOK | wxCANCEL | wxICON_QUESTION);
+    dialog.SetOKLabel("&Delete");
+    if (dialog.ShowModal() != wxID_OK) return;
+  }
+  frame_.Files().Trash({path});
+  loader_->Forget(path);
+  list_.erase(list_.begin() + static_cast<std::ptrdiff_t>(place_));
+  if (list_.empty()) {
+    Close();
+    return;
+  }
+  place_ = std::min(place_, list_.size() - 1);
+  page_ = 0;
+  ShowPlace();
 }
 
 void ViewFrame::CopyPicture() {

@@ -33,6 +33,7 @@ class ViewFrame : public wxFrame {
   void ToggleOverlay();
   void Leave();  // full screen first, then the window
   void CopyPicture();
+  void DeleteFile();  // to the trash; the next one is shown
   void ShowInfoWindow();
   size_t LastPlace() const { return list_.size() - 1; }
   bool CanPan() const { return transform_.CanPan(); }
@@ -42,6 +43,7 @@ class ViewFrame : public wxFrame {
   class Canvas;
   void BuildMenu();
   void ShowPlace();
+  void ShowPreview();
   void WantPictures();
   void PictureCame();
   void ScaledCame();
@@ -64,6 +66,7 @@ class ViewFrame : public wxFrame {
   int32_t page_ = 0;
   ViewPicturePointer shown_;  // what is on the screen; of another place until the wanted one comes
   std::unique_ptr<ViewScaler::Scaled> scaled_;
+  PackedImage preview_;  // the browser's thumbnail, which is on the screen until the picture comes; else empty
   ViewTransform transform_;
   double keyTime_ = 0;  // when the picture that is awaited was asked for
   bool overlay_ = false;
