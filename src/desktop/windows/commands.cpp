@@ -172,7 +172,8 @@ constexpr Command kCommands[] = {
     {kTools, "&Setup...",            "Ctrl+,",       "Shows all settings.", Needs::Nothing, ShowSetup, "setup"},
 
     {kHelp, "&Find command...",      "Ctrl+K",       "Finds a command by words of its name.", Needs::Nothing, FindCommand},
-    {kHelp, "&Configuration",        "F1",           "Tells how settings are kept.", Needs::Nothing, ShowHelp},
+    {kHelp, "&Manual",               "F1",           "Tells what the windows can do, and with which keys.", Needs::Nothing, ShowManual},
+    {kHelp, "&Configuration",        "",             "Tells how settings are kept.", Needs::Nothing, ShowConfigurationHelp},
 };
 // clang-format on
 

@@ -1,53 +1,40 @@
 #include "desktop/windows/help.h"
 
-#include <wx/msgdlg.h>
+#include <wx/dialog.h>
+#include <wx/sizer.h>
+#include <wx/textctrl.h>
 
-#include <string>
-
+#include "desktop/event_log.h"
+#include "desktop/setup_help.h"
 #include "desktop/windows/wx_text.h"
-#include "platform/files.h"
-#include "platform/folders.h"
-#include "platform/paths.h"
-#include "platform/process.h"
 
 namespace fotomill::desktop {
 
 namespace {
 
-struct Topic {
-  std::string_view topic;
-  const char* page;
-};
-constexpr Topic kTopics[] = {
-    {"OVERWRITE", "desktop.md"},
-    {"RENAME", "desktop.md"},
-    {"configuration", "configuration.md"},
-    {"plugins", "plugins.md"},
-};
-
-// Beside an installed program, or in the tree that it was built in.
-constexpr const char* kPlaces[] = {"../share/doc/fotomill", "../../docs", "docs"};
-
-std::string PageOf(std::string_view topic) {
-  std::string name = "configuration.md";  // a key of the configuration
-  for (const Topic& row : kTopics) {
-    if (row.topic == topic) name = row.page;
-  }
-  for (const char* place : kPlaces) {
-    const std::string path = platform::AbsolutePath(platform::JoinFolder(platform::JoinFolder(platform::ProgramFolder(), place), name));
-    if (platform::IsRegularFile(path)) return path;
-  }
-  return name;
-}
+constexpr size_t kMostOfAnEntry = 800;  // bytes; what is longer gets a larger window
 
 }  // namespace
 
 void ShowHelp(wxWindow& window, std::string_view topic) {
-  const std::string page = PageOf(topic);
-  const std::vector<std::string> program = platform::ProgramFor(page);
-  if (!program.empty() && platform::RunProgram(program, false)) return;
-  wxMessageBox("No program is registered that shows this page of the manual:\n" + Shown(page), "Help", wxOK | wxICON_INFORMATION,
-               &window);
+  const HelpText help = HelpOn(topic);
+  wxDialog dialog(wxGetTopLevelParent(&window), wxID_ANY, "Help: " + Shown(help.title), wxDefaultPosition, wxDefaultSize,
+                  wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "HelpBox");
+  auto* column = new wxBoxSizer(wxVERTICAL);
+  const bool whole = help.text.size() > kMostOfAnEntry;
+  auto* text = new wxTextCtrl(&dialog, wxID_ANY, wxString::FromUTF8(help.text.data(), help.text.size()), wxDefaultPosition,
+                              dialog.FromDIP(wxSize(560, whole ? 460 : 150)), wxTE_MULTILINE | wxTE_READONLY | wxTE_BESTWRAP);
+  text->SetName("Help");
+  column->Add(text, wxSizerFlags(1).Expand().Border(wxALL, dialog.FromDIP(10)));
+  column->Add(dialog.CreateSeparatedButtonSizer(wxCLOSE), wxSizerFlags().Expand().Border(wxALL, dialog.FromDIP(8)));
+  dialog.SetSizerAndFit(column);
+  dialog.SetEscapeId(wxID_CLOSE);
+  dialog.Bind(wxEVT_BUTTON, [&dialog](wxCommandEvent&) { dialog.EndModal(wxID_CLOSE); }, wxID_CLOSE);
+  text->SetFocus();
+  LogEvent("help", help.title);
+  dialog.CentreOnParent();
+  dialog.ShowModal();
+  LogEvent("help", "closed");
 }
 
 }  // namespace fotomill::desktop

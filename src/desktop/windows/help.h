@@ -6,7 +6,7 @@ class wxWindow;
 
 namespace fotomill::desktop {
 
-// Opens the page of the manual for a topic with the system's program for it. Says where the page should be when it cannot.
+// Shows the help for a topic: the name of a key, of a Help button, or of a page (setup_help.h).
 void ShowHelp(wxWindow& window, std::string_view topic);
 
 }  // namespace fotomill::desktop

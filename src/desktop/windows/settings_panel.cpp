@@ -2,7 +2,6 @@
 
 #include <wx/checkbox.h>
 #include <wx/choice.h>
-#include <wx/dialog.h>
 #include <wx/gbsizer.h>
 #include <wx/sizer.h>
 #include <wx/spinctrl.h>
@@ -15,6 +14,7 @@
 #include "catalog/file_history.h"
 #include "desktop/setup_help.h"
 #include "desktop/windows/colour_button.h"
+#include "desktop/windows/help.h"
 #include "desktop/windows/mask_list.h"
 #include "desktop/windows/wx_text.h"
 
@@ -151,27 +151,8 @@ void BindSettingsHelp(wxWindow& window) {
     for (const wxWindow* focus = wxWindow::FindFocus(); focus != nullptr && page == kGeneralHelpPage; focus = focus->GetParent()) {
       if (focus->GetId() > 0) page = HelpPageFor(static_cast<uint32_t>(focus->GetId()));
     }
-    ShowHelpPage(&window, page);
+    ShowHelp(window, page);
   });
-}
-
-void ShowHelpPage(wxWindow* parent, std::string_view page) {
-  const HelpText help = HelpOn(page);
-  wxDialog dialog(parent, wxID_ANY, "Help: " + Shown(help.title), wxDefaultPosition, wxDefaultSize,
-                  wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "HelpBox");
-  auto* column = new wxBoxSizer(wxVERTICAL);
-  const bool whole = !HasHelpEntry(page);
-  auto* text = new wxTextCtrl(&dialog, wxID_ANY, wxString::FromUTF8(help.text.data(), help.text.size()), wxDefaultPosition,
-                              dialog.FromDIP(wxSize(560, whole ? 460 : 150)), wxTE_MULTILINE | wxTE_READONLY | wxTE_BESTWRAP);
-  text->SetName("Help");
-  column->Add(text, wxSizerFlags(1).Expand().Border(wxALL, dialog.FromDIP(10)));
-  column->Add(dialog.CreateSeparatedButtonSizer(wxCLOSE), wxSizerFlags().Expand().Border(wxALL, dialog.FromDIP(8)));
-  dialog.SetSizerAndFit(column);
-  dialog.SetEscapeId(wxID_CLOSE);
-  dialog.Bind(wxEVT_BUTTON, [&dialog](wxCommandEvent&) { dialog.EndModal(wxID_CLOSE); }, wxID_CLOSE);
-  text->SetFocus();
-  dialog.CentreOnParent();
-  dialog.ShowModal();
 }
 
 }  // namespace fotomill::desktop

@@ -36,7 +36,5 @@ class SettingsPanel : public wxScrolledWindow {
 
 // F1 in a window of settings: shows the help page of the control that has the focus.
 void BindSettingsHelp(wxWindow& window);
-// Shows a help page: of a key, or the general one.
-void ShowHelpPage(wxWindow* parent, std::string_view page);
 
 }  // namespace fotomill::desktop

@@ -19,6 +19,7 @@
 #include "desktop/event_log.h"
 #include "desktop/windows/batch_runner.h"
 #include "desktop/windows/format_list.h"
+#include "desktop/windows/help.h"
 #include "desktop/windows/main_frame.h"
 #include "desktop/windows/wx_text.h"
 #include "platform/files.h"
@@ -194,7 +195,7 @@ wxSizer* SetupBox::BuildButtons() {
     if (Apply()) EndModal(wxID_OK);
   }, wxID_OK);
   Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { (void)Apply(); }, wxID_APPLY);
-  Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { ShowHelpPage(this, kGeneralHelpPage); }, wxID_HELP);
+  Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { ShowHelp(*this, kGeneralHelpPage); }, wxID_HELP);
   return row;
 }
 

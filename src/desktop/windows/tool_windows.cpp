@@ -2,7 +2,9 @@
 
 #include "core/setup_dialog.h"
 #include "desktop/event_log.h"
+#include "desktop/setup_help.h"
 #include "desktop/windows/exif_frame.h"
+#include "desktop/windows/help.h"
 #include "desktop/windows/history_box.h"
 #include "desktop/windows/info_frame.h"
 #include "desktop/windows/main_frame.h"
@@ -37,6 +39,7 @@ void ShowCleanUp(MainFrame& frame) {
   LogEvent("cleanup", "closed");
 }
 void ShowPlugins(MainFrame& frame) { PluginBox(&frame).ShowModal(); }
-void ShowHelp(MainFrame& frame) { ShowHelpPage(&frame, kGeneralHelpPage); }
+void ShowManual(MainFrame& frame) { ShowHelp(frame, kManual); }
+void ShowConfigurationHelp(MainFrame& frame) { ShowHelp(frame, kGeneralHelpPage); }
 
 }  // namespace fotomill::desktop

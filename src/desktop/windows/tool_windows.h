@@ -12,6 +12,7 @@ void ShowFileHistory(MainFrame& frame);
 void ShowCompaction(MainFrame& frame);
 void ShowCleanUp(MainFrame& frame);  // of the folder in front
 void ShowPlugins(MainFrame& frame);
-void ShowHelp(MainFrame& frame);
+void ShowManual(MainFrame& frame);
+void ShowConfigurationHelp(MainFrame& frame);
 
 }  // namespace fotomill::desktop
