@@ -150,6 +150,9 @@ Status WriteAll(ByteWriter& out, PictureRecord& picture, bool keep) {
   HdpMetadata extra;
   if (keep) extra.exif = ParseExifBlock(picture.metadata.exif);
   if (keep && extra.exif.Empty() && !picture.metadata.exif.empty()) picture.lostMetadata |= kLostExif;
+  for (ExifEntry& entry : extra.exif.first) {  // cameras leave out the zero that ends a text; other readers insist on it
+    if (entry.type == kHdpText && (entry.value.empty() || entry.value.back() != 0)) entry.value.push_back(0);
+  }
   if (!picture.comment.empty()) {
     extra.comment = picture.comment;
     extra.comment.push_back(0);
