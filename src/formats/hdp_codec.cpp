@@ -188,7 +188,7 @@ bool DecodeStream(const DecodeJob& job, HdpRaster& raster, const std::function<v
   for (int32_t row = 0; decoded && row <= blocks; ++row) {  // each row of blocks is complete only with the next one
     size_t lines = 0;
     buffer.uiFirstMBRow = buffer.uiLastMBRow = static_cast<unsigned>(row);
-    decoded = library.decode(context, &buffer, &lines) == ICERR_OK;
+    decoded = library.decode(context, &buffer, &lines) == ICERR_OK && !source.overrun;
     tell(std::min(row * kBlock, job.stream.height));
   }
   library.decodeTerm(context);
@@ -206,7 +206,8 @@ Status MakeRaster(const HdpPage& page, HdpRaster& raster) {
   const auto width = static_cast<uint64_t>(page.image.width), height = static_cast<uint64_t>(page.image.height);
   raster.stride = shape.bytes == 0 ? (width + 7) / 8 : width * raster.samples * shape.bytes;
   raster.stride = (raster.stride + 127) / 128 * 128;
-  if (raster.stride > limits.packedBlockBytes / height) return Status::MemoryAllocationError;
+  constexpr uint64_t kShare = 2;  // the picture is held as well
+  if (raster.stride > limits.packedBlockBytes / kShare / height) return Status::MemoryAllocationError;
   return raster.block.Allocate(raster.stride * height) ? Status::Ok : Status::MemoryAllocationError;
 }
 

@@ -13,6 +13,7 @@
 #include <thread>
 #include <vector>
 
+#include "core/limits.h"
 #include "formats/png_filter.h"
 #include "platform/memory.h"
 #include "platform/process.h"
@@ -219,6 +220,7 @@ void WriteChunk(ByteWriter& out, std::span<const uint8_t> head, std::span<const 
 
 Status WritePngPixels(const PngRows& rows, bool filtered, int32_t level, ByteWriter& out,
                       const std::function<void(int32_t)>& report) {
+  if (rows.rowBytes > limits.packedBlockBytes / 8) return Status::MemoryAllocationError;  // a band takes several rows' room
   const BandMaker maker(rows, filtered, level);
   const int32_t bands = maker.Bands();
   BandQueue queue(maker, std::min({platform::CoreCount(), kMostThreads, static_cast<unsigned>(bands)}));

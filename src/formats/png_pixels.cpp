@@ -56,7 +56,8 @@ bool PngPixels::Inflate(std::span<const uint8_t> file, uint64_t rowBytes, uint32
   rowBytes_ = rowBytes;
   pixelBytes_ = std::max(1u, pixelBits / 8);
   const auto rows = static_cast<uint64_t>(height);
-  if (rowBytes == 0 || rowBytes + 1 > limits.packedBlockBytes / rows) return false;
+  constexpr uint64_t kShare = 4;  // of what a picture may take, since that and the deflated data are held as well
+  if (rowBytes == 0 || rowBytes + 1 > limits.packedBlockBytes / kShare / rows) return false;
   const uint64_t size = (rowBytes + 1) * rows;
   std::vector<std::span<const uint8_t>> parts;
   uint64_t packed = 0;

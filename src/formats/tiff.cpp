@@ -349,7 +349,7 @@ bool ReadPlainStrips(TiffInput& input, const TiffLayout& layout, const PictureRe
     const uint32_t rows = std::min(layout.bandHeight, layout.height - top);
     const uint64_t offset = TIFFGetStrileOffset(tiff, strip), stored = TIFFGetStrileByteCount(tiff, strip);
     if (offset > input.Bytes().size() || stored > input.Bytes().size() - offset) return false;
-    if (rowBytes * rows > limits.packedBlockBytes || (!packed && rowBytes * rows > stored)) return false;
+    if ((packed && rowBytes * rows > limits.packedBlockBytes / 4) || (!packed && rowBytes * rows > stored)) return false;
     const auto data = input.Bytes().subspan(offset, stored);
     uint8_t* decoded = packed ? decoder.Decode(data, rowBytes * rows) : nullptr;
     if (packed && decoded == nullptr) return false;
