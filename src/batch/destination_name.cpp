@@ -1,5 +1,7 @@
 #include "batch/destination_name.h"
 
+#include <algorithm>
+
 #include "core/plain_name.h"
 #include "core/settings.h"
 #include "core/text.h"
@@ -33,25 +35,39 @@ std::string WithBase(const std::string& path, std::string_view base) {
   return platform::JoinPath({parts.drive, parts.folder, base, parts.extension});
 }
 
-bool IsFileName(std::string_view name) { return !name.empty() && IsPlainName(name); }
+// Whether a path leads up on its way.
+bool LeadsUp(std::string_view path) {
+  while (!path.empty()) {
+    const size_t end = std::min(path.find_first_of("/\\"), path.size());
+    if (path.substr(0, end) == "..") return true;
+    path.remove_prefix(std::min(end + 1, path.size()));
+  }
+  return false;
+}
+
+bool IsFileName(std::string_view name) { return !name.empty() && name != "." && IsPlainName(name); }
 
 // Asks until the name can be taken or nobody wants one. The extension stays the format's, cased after the source's.
-bool AskName(std::string& path, const std::string& source, std::string_view title, BatchJob& job) {
+bool AskName(Destination& destination, const std::string& source, std::string_view title, BatchJob& job) {
   const std::string extension =
       CasedExtension(ExtensionOfFormat(job), platform::ExtensionOf(source), job.naming.extensionCase);
-  NameQuestion question{std::string(title), source, path, extension, {}};
-  const std::string folder(platform::SplitPath(path).folder);
+  NameQuestion question{std::string(title), source, destination.path, extension, {}};
+  const platform::PathParts planned = platform::SplitPath(destination.path);
+  const std::string folder = std::string(planned.drive).append(planned.folder);
   for (;;) {
     const std::optional<std::string> typed = job.prompts->AskDestinationName(question);
     if (!typed) return false;
     const platform::PathParts parts = platform::SplitPath(*typed);
     const std::string dotted = "." + extension;
     const auto whole = CompletedDestination(platform::JoinPath({parts.drive, parts.folder, parts.base, dotted}), folder);
-    if (IsFileName(parts.base) && whole && FitsPath(*whole)) {
-      path = *whole;
+    const bool plain = IsFileName(parts.base) && !LeadsUp(parts.folder);
+    if (plain && whole) {
+      const platform::PathParts chosen = platform::SplitPath(*whole);
+      destination.elsewhere = folder != std::string(chosen.drive).append(chosen.folder);
+      destination.path = *whole;
       return true;
     }
-    question.problem = IsFileName(parts.base) ? kTooLong : kNotPlain;
+    question.problem = plain ? kTooLong : kNotPlain;
   }
 }
 
@@ -212,9 +228,10 @@ DestinationAnswer MakeDestinationName(Destination& destination, const std::strin
     return DestinationAnswer::Write;
   }
   const bool asked = job.naming.askName && job.prompts != nullptr;
-  if (asked && !AskName(destination.path, source, title, job)) return DestinationAnswer::Skip;
+  if (asked && !AskName(destination, source, title, job)) return DestinationAnswer::Skip;
   DestinationAnswer answer = DestinationAnswer::Write;
-  if (taken(destination.path)) {
+  destination.taken = taken(destination.path);
+  if (destination.taken) {
     answer = AsksAboutCollisions(job) ? AskAboutCollision(destination, source, job, taken, variant, picture)
                                       : SettleUnasked(destination, job.overwrite, job.applyToRest, variant);
   }

@@ -49,6 +49,8 @@ struct Destination {
   bool recycle = false;      // and goes to the recycle bin
   bool asked = false;        // because the user said so of this very file
   std::string password;      // empty: none
+  bool elsewhere = false;    // the user chose another folder for it, which is not made
+  bool taken = false;        // the name was not free
   bool noVariant = false;    // skipped because no numbered variant is free
 };
 

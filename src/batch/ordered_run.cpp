@@ -10,11 +10,12 @@ namespace fotomill {
 namespace {
 
 constexpr std::chrono::milliseconds kTick{200};
+constexpr size_t kMostThreads = 256;  // more only cost
 
 }  // namespace
 
 void OrderedRun::Run(size_t count, uint32_t threads) {
-  threads = static_cast<uint32_t>(std::min<size_t>(threads, count));
+  threads = static_cast<uint32_t>(std::min({size_t{threads}, count, kMostThreads}));
   if (threads > 1) {
     states_.assign(count, State::AtWork);
     workers_.reserve(threads);

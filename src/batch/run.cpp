@@ -5,6 +5,7 @@
 #include <memory>
 #include <mutex>
 #include <new>
+#include <optional>
 
 #include "batch/abort.h"
 #include "batch/destination_name.h"
@@ -49,8 +50,12 @@ FileOutcome Failure(const BatchFile& file, Status status, std::string hint = {})
 class Batch {
  public:
   Batch(std::span<const BatchFile> files, const BatchFunction& function, BatchJob& job)
-      : files_(files), function_(function), job_(job),
-        prefix_(function.prefix ? *function.prefix : std::string(PrefixOf(function.history))), asksEveryName_(AsksEveryName(job)), outcomes_(files.size()) {
+      : files_(files),
+        function_(function),
+        job_(job),
+        prefix_(function.prefix ? *function.prefix : std::string(PrefixOf(function.history))),
+        asksEveryName_(AsksEveryName(job)),
+        outcomes_(files.size()) {
     for (const BatchFile& file : files_) {
       if (file.status == Status::Ok) names_.AddSource(file.name, Planned(file));
     }
@@ -83,19 +88,19 @@ class Batch {
 
   // On any thread: one file from its source to its output.
   void Work(size_t i) {
-    auto outcome = std::make_unique<FileOutcome>();
+    std::optional<FileOutcome> outcome;
     try {
-      *outcome = Process(i);
+      outcome = Process(i);
     } catch (const std::bad_alloc&) {
-      *outcome = Failure(files_[i], Status::MemoryAllocationError);
+      outcome = Failure(files_[i], Status::MemoryAllocationError);
     }
-    outcomes_[i] = std::move(outcome);
+    if (outcome) outcomes_[i] = std::make_unique<FileOutcome>(std::move(*outcome));
   }
 
   // On the calling thread, in the order of the selection.
   void Deliver(size_t i) {
     const std::unique_ptr<FileOutcome> outcome = std::move(outcomes_[i]);
-    if (outcome->status == Status::FunctionCancelled) return;  // given up by Abort before it had a name
+    if (outcome == nullptr) return;
     job_.source.AssignCut(outcome->source);
     const bool written = outcome->status == Status::Ok && !outcome->skipped && !function_.dryRun;
     if (written) NoteUse(outcome->source);
@@ -113,18 +118,19 @@ class Batch {
 
   void NoteUse(const std::string& source) {
     if ((settings.FileHistoryFunctions >> static_cast<int32_t>(function_.history) & 1) == 0) return;
-    job_.uses.push_back({names_.Key(source), function_.history, kOwnTime,
-                         static_cast<int32_t>(platform::Now()), false});
+    const auto now = static_cast<int32_t>(platform::Now());
+    job_.uses.push_back({names_.Key(source), function_.history, kOwnTime, now, false});
   }
 
-  FileOutcome Process(size_t i) {
+  // nullopt for a file that was given up by Abort before it had a name.
+  std::optional<FileOutcome> Process(size_t i) {
     const BatchFile& file = files_[i];
     if (file.status != Status::Ok) return Failure(file, file.status, file.hint);
     Destination destination;
     destination.path = Planned(file);
     if (destination.path.size() > PathText::Capacity()) return Failure(file, Status::InvalidDestination, kTooLong);
     // Where another file's output may take this source's place, the order of the selection says which comes first.
-    if (names_.IsOutputOfOthers(file.name, destination.path) && !run_->InTurn(i, [] {})) return Cancelled(file);
+    if (names_.IsOutputOfOthers(file.name, destination.path) && !run_->InTurn(i, [] {})) return std::nullopt;
     if (IsLeftOut(i, destination)) return Skipped(file, destination);
     PicturePointer picture;
     if (const Status status = Load(file.name, picture); status != Status::Ok) {
@@ -138,8 +144,6 @@ class Batch {
     return WriteUnderFreeName(i, std::move(destination), *picture);
   }
 
-  static FileOutcome Cancelled(const BatchFile& file) { return Failure(file, Status::FunctionCancelled); }
-
   static FileOutcome Skipped(const BatchFile& file, const Destination& destination) {
     FileOutcome outcome{.source = file.name, .destination = destination.path, .skipped = true};
     if (destination.noVariant) {
@@ -147,22 +151,21 @@ class Batch {
       outcome.destination.clear();
       outcome.hint = kWriteAborted;
     } else {
-      outcome.hint = "skipped, " + destination.path + " exists.";
+      outcome.hint = destination.taken ? "skipped, " + destination.path + " exists." : "skipped.";
     }
     return outcome;
   }
 
   // Whether a file is only going to be skipped; it need not be decoded then.
-  bool IsLeftOut(size_t i, const Destination& destination) {
+  bool IsLeftOut(size_t i, Destination& destination) {
     const std::string& source = files_[i].name;
     {
       const std::lock_guard lock(mutex_);
       if (!rules_.overwrite.skip) return false;
-      if (IsIndependent(source, destination.path)) return names_.Taken(destination.path, source);
+      if (IsIndependent(source, destination.path)) return destination.taken = names_.Taken(destination.path, source);
     }
-    bool taken = false;
-    (void)run_->InTurn(i, [&] { taken = IsTaken(destination.path, source); });
-    return taken;
+    (void)run_->InTurn(i, [&] { destination.taken = IsTaken(destination.path, source); });
+    return destination.taken;
   }
 
   Status Load(const std::string& name, PicturePointer& picture) const {
@@ -190,13 +193,13 @@ class Batch {
   }
 
   // Settles the name and writes, again when someone else has taken the name since it was found free.
-  FileOutcome WriteUnderFreeName(size_t i, Destination planned, PictureRecord& picture) {
+  std::optional<FileOutcome> WriteUnderFreeName(size_t i, Destination planned, PictureRecord& picture) {
     const BatchFile& file = files_[i];
     for (int attempt = 0; attempt < kMostLostRaces; ++attempt) {
       Destination destination = planned;
       bool cancelled = false;
       if (Settle(i, destination, picture, cancelled) == DestinationAnswer::Skip) {
-        return cancelled ? Cancelled(file) : Skipped(file, destination);
+        return cancelled ? std::nullopt : std::optional(Skipped(file, destination));
       }
       if (destination.path.size() > PathText::Capacity()) {
         GiveBack(destination.path);
@@ -238,7 +241,8 @@ class Batch {
     if (asksEveryName_ || !IsIndependent(source, destination.path)) return false;
     Destination settled = destination;
     answer = DestinationAnswer::Write;
-    if (names_.Taken(settled.path, source)) {
+    settled.taken = names_.Taken(settled.path, source);
+    if (settled.taken) {
       if (rules_.asks) return false;
       bool free = true;
       const TakenTest taken = [&](const std::string& path) {
@@ -291,8 +295,8 @@ class Batch {
 
   // Codecs may take less than their row says; colours are then reduced further, step by step.
   Status Write(PictureRecord& picture, const Destination& destination) const {
-    const bool ownFolder = job_.naming.beside || job_.destinationFolder.empty() || !function_.out.empty();
-    if (!ownFolder && !platform::MakeFolders(FolderOf(destination.path))) return Status::ErrorCreatingFile;
+    const bool there = job_.naming.beside || job_.destinationFolder.empty() || !function_.out.empty() || destination.elsewhere;
+    if (!there && !platform::MakeFolders(FolderOf(destination.path))) return Status::ErrorCreatingFile;
     WriteOptions write;
     write.existing = destination.replace ? platform::Existing::Replace : platform::Existing::Refuse;
     write.keepMetadata = function_.keepMetadata;
@@ -349,7 +353,7 @@ class Batch {
   BatchJob& job_;
   const std::string prefix_;
   const bool asksEveryName_;
-  std::vector<std::unique_ptr<FileOutcome>> outcomes_;  // of files that are done and not yet reported
+  std::vector<std::unique_ptr<FileOutcome>> outcomes_;  // of files that are done and not yet reported; null: given up
   OrderedRun* run_ = nullptr;
   std::atomic<bool> ended_{false};
   mutable std::mutex mutex_;  // over what follows

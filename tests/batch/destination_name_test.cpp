@@ -159,7 +159,7 @@ TEST(DestinationName, TypedNamesAndVariants) {
   BatchJob job;
   job.prompts = &prompts;
   job.naming.askName = true;
-  prompts.names = {"bad\nname", "else.where"};
+  prompts.names = {"bad\nname", "x/../../up", "..", std::string(300, 'l'), "else.where"};
   EXPECT_EQ(Settle(job, {}, "in/a.BMP"), "in/else.TIF");
   prompts.names = {"/other/b.tif"};
   EXPECT_EQ(Settle(job, {"/other/b.tif"}, "in/a.bmp"), "skipped");  // the overwrite prompt was cancelled
