@@ -215,8 +215,8 @@ void SetUpExif(CLI::App& app, CommandContext& context) {
   AddTexts(app, "--distance", options->distance, 2, "LAT,LON LAT,LON",
            "Tell how far two places in decimal degrees are apart, in the unit that ExifDistinceUnits chooses");
   SetFooter(app,
-            "Reads JPEG, TIFF, PNG and WebP files and bare EXIF blocks; several files each have their name on a line "
-            "above.\n\n"
+            "Reads JPEG, TIFF, HD Photo, PNG and WebP files and bare EXIF blocks; several files each have their name on a "
+            "line above.\n\n"
             "Example: fotomill exif photo.jpg --thumbnail small.jpg");
   context.run = [options, &context] { return RunExif(*options, context); };
 }

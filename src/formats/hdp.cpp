@@ -17,7 +17,6 @@
 #include <vector>
 
 #include "core/limits.h"
-#include "formats/exif_directories.h"
 #include "formats/hdp_codec.h"
 #include "formats/hdp_file.h"
 #include "platform/file_view.h"
@@ -240,9 +239,7 @@ void Assign(std::vector<uint8_t>& block, std::span<const uint8_t> data) {
 void TakeMetadata(std::span<const uint8_t> file, const HdpPage& page, PictureRecord& picture) {
   PictureMetadata& metadata = picture.metadata;
   metadata = {};
-  ExifDirectories directories = GatherExif(file, {}, page.directory);
-  SetOrientation(directories, OrientationOfTurn(page.turn));
-  metadata.exif = MakePictureBlock(std::move(directories));
+  metadata.exif = HdpExifBlock(file, page);
   Assign(metadata.xmp, page.xmp);
   Assign(metadata.icc, page.icc);
   const auto end = std::find(page.description.begin(), page.description.end(), uint8_t{0});

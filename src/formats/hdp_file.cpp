@@ -19,6 +19,7 @@
 #include <iterator>
 
 #include "core/byte_reader.h"
+#include "formats/exif_directories.h"
 
 namespace fotomill {
 
@@ -296,6 +297,12 @@ Status ParseHdpPage(std::span<const uint8_t> file, int32_t page, HdpPage& result
   const bool matches = result.alpha.width == result.image.width && result.alpha.height == result.image.height &&
                        result.alpha.depth == result.image.depth && result.alpha.colors == HdpColors::Grey;
   return matches ? Status::Ok : Status::DamagedFile;
+}
+
+std::vector<uint8_t> HdpExifBlock(std::span<const uint8_t> file, const HdpPage& page) {
+  ExifDirectories directories = GatherExif(file, {}, page.directory);
+  SetOrientation(directories, OrientationOfTurn(page.turn));
+  return MakePictureBlock(std::move(directories));
 }
 
 }  // namespace fotomill

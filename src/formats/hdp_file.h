@@ -3,6 +3,7 @@
 #include <array>
 #include <cstdint>
 #include <span>
+#include <vector>
 
 #include "core/status.h"
 
@@ -78,6 +79,10 @@ int32_t CountHdpPages(std::span<const uint8_t> file);
 // Reads the directory of a page, from 0, and its codestreams' heads. NoImages when there is no such page; else as
 // above.
 Status ParseHdpPage(std::span<const uint8_t> file, int32_t page, HdpPage& result);
+
+// The EXIF block of a page that was parsed: what a camera's directories say, and the turn as orientation. Empty when there
+// is nothing to say.
+std::vector<uint8_t> HdpExifBlock(std::span<const uint8_t> file, const HdpPage& page);
 
 // The entries of a directory that both reader and writer know.
 inline constexpr uint16_t kHdpDescription = 270, kHdpXmp = 700, kHdpIcc = 34675, kHdpExif = 34665, kHdpGps = 34853;

@@ -4,9 +4,11 @@
 #include <array>
 #include <cstring>
 #include <string_view>
+#include <vector>
 
 #include "core/byte_reader.h"
 #include "core/limits.h"
+#include "formats/hdp_file.h"
 
 namespace fotomill {
 
@@ -35,6 +37,7 @@ Status ExifSource::Open(const char* path) {
   block_ = {};
   copy_.Free();
   if (!file_.OpenHead(path, kHeadSize)) return Status::FileOpenError;
+  if (Starts(file_.Bytes(), "II\xBC")) return GatherFromHdp(path);
   Place place;
   RETURN_IF_BAD(Find(place));
   return Take(path, place);
@@ -46,6 +49,18 @@ Status ExifSource::Find(Place& place) const {
   if (Starts(head, kPngSignature)) return FindInPng(place);
   if (Starts(head, "RIFF") && head.size() >= 12 && Starts(head.subspan(8), "WEBP")) return FindInWebp(place);
   if (StartsBareBlock(head) || Starts(head, kExifMark)) place = {0, file_.FileSize()};
+  return Status::Ok;
+}
+
+Status ExifSource::GatherFromHdp(const char* path) {
+  if (!file_.Open(path)) return Status::FileOpenError;
+  HdpPage page;
+  if (ParseHdpPage(file_.Bytes(), 0, page) != Status::Ok) return Status::Ok;
+  const std::vector<uint8_t> block = HdpExifBlock(file_.Bytes(), page);
+  if (block.empty()) return Status::Ok;
+  if (!copy_.Allocate(block.size(), platform::Fill::Unset)) return Status::MemoryAllocationError;
+  std::copy(block.begin(), block.end(), copy_.Data());
+  block_ = copy_.Bytes();
   return Status::Ok;
 }
 

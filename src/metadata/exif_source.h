@@ -15,6 +15,7 @@ namespace fotomill {
 //   TIFF  the whole file, as well as any bare block: "II" or "MM", or any mark before a big-endian 42
 //   PNG   the eXIf chunk
 //   WebP  the EXIF chunk
+//   HD Photo: the EXIF and GPS directories among the file's own, gathered into a block
 //
 // "Exif" and two zero bytes in front of a block are also taken off where the container does not ask for them. Only the
 // head of the file is read, and beyond it the places where segments and chunks begin.
@@ -37,11 +38,12 @@ class ExifSource {
   Status FindInJpeg(Place& place) const;
   Status FindInPng(Place& place) const;
   Status FindInWebp(Place& place) const;
+  Status GatherFromHdp(const char* path);
   Status Fetch(uint64_t offset, std::span<uint8_t> into) const;
   Status Take(const char* path, const Place& place);
 
   platform::FileView file_;     // the head, or the whole of a TIFF file
-  platform::MemoryBlock copy_;  // a block that does not lie in the head
+  platform::MemoryBlock copy_;  // a block that does not lie in the head, or was gathered
   std::span<const uint8_t> block_;
 };
 

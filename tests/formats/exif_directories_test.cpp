@@ -4,8 +4,10 @@
 
 #include "formats/hdp.h"
 #include "formats/tiff.h"
+#include "metadata/exif_source.h"
 #include "support/codecs.h"
 #include "support/exif_blocks.h"
+#include "support/files.h"
 #include "support/hex.h"
 
 namespace fotomill::test {
@@ -40,6 +42,11 @@ TEST(ExifDirectories, TravelThroughFilesOfDirectories) {
       ASSERT_EQ(back.status, Status::Ok);
       EXPECT_EQ(picture->lostMetadata, 0);
       EXPECT_EQ(PictureLines(back.picture->metadata.exif), PictureLines(block));
+      const TemporaryFolder folder;  // the same without decoding
+      WriteBytes(folder.Path("picture"), Encode(row.write, *picture));
+      ExifSource source;
+      ASSERT_EQ(source.Open(folder.Path("picture").c_str()), Status::Ok);
+      EXPECT_EQ(PictureLines({source.Block().begin(), source.Block().end()}), PictureLines(block));
       EXPECT_EQ(PictureLines(block).size(), 10u);
     }
     const PicturePointer broken = PatternPicture(20, 10, 24);
