@@ -101,6 +101,7 @@ def main():
             desktop.key("ctrl+comma")
             desktop.wait(r"setup page=Browsing")
             desktop.focus("Setup")
+            desktop.wait(r"setup list has the keyboard")
             desktop.key("Down", "Down", "Down", "Down")
             desktop.wait(r"setup page=Saving")
             keep(desktop, "desktop-setup")

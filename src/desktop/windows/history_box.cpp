@@ -101,7 +101,10 @@ void FileHistoryBox::BuildList() {
     Refill();
   });
   Bind(wxEVT_CHAR_HOOK, [this](wxKeyEvent& event) {
-    if (event.GetKeyCode() == WXK_DELETE && list_->HasFocus()) return RemoveSelected();
+    if (!list_->HasFocus()) return event.Skip();
+    const int key = event.GetKeyCode();
+    if (key == WXK_DELETE) return RemoveSelected();
+    if (key == WXK_RETURN || key == WXK_NUMPAD_ENTER) return ViewFile();
     event.Skip();
   });
 }
@@ -126,7 +129,10 @@ void FileHistoryBox::Refill() {
   const double scale = GetContentScaleFactor();
   thumbnails_.Want(paths, static_cast<int>(FromDIP(ThumbnailSide()) * scale), scale);
   lines_->Reset(static_cast<unsigned>(history_.Count()));
-  if (history_.Count() > 0) list_->Select(lines_->GetItem(0));
+  if (history_.Count() > 0) {
+    list_->SetCurrentItem(lines_->GetItem(0));
+    list_->Select(lines_->GetItem(0));
+  }
   UpdateControls();
   LogEvent("history", "rows=" + std::to_string(history_.Count()) + " sort=" + std::to_string(history_.SortColumn()));
 }

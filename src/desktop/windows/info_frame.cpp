@@ -51,30 +51,8 @@ InfoFrame::InfoFrame(MainFrame& frame, wxWindow* parent, std::vector<std::string
     column->Add(splitter, wxSizerFlags(1).Expand().Border(wxALL, gap));
     list_->Bind(wxEVT_LISTBOX, [this](wxCommandEvent&) { ShowChoice(); });
   }
-  auto* buttons = new wxBoxSizer(wxHORIZONTAL);
-  struct Button {
-    wxWindowID id;
-    const char* label;
-    std::function<void()> run;
-  };
-  const Button rows[] = {
-      {wxID_COPY, "&Copy value", [this] { CopyText(tree_->SelectedValue()); }},
-      {wxID_SELECTALL, "Copy &all", [this] { CopyText(wxString::FromUTF8(WholeText())); }},
-      {wxID_SAVE, "&Save as text...", [this] { SaveTextAs(*this, "info.txt", WholeText()); }},
-      {wxID_CLOSE, "C&lose", [this] { Close(); }},
-  };
-  for (const Button& row : rows) {
-    if (row.id == wxID_CLOSE) buttons->AddStretchSpacer();
-    auto* button = new wxButton(panel, row.id, row.label);
-    buttons->Add(button, wxSizerFlags().Border(wxRIGHT, row.id == wxID_CLOSE ? 0 : FromDIP(6)));
-    Bind(wxEVT_BUTTON, [run = row.run](wxCommandEvent&) { run(); }, row.id);
-    Bind(wxEVT_MENU, [run = row.run](wxCommandEvent&) { run(); }, row.id);
-  }
-  column->Add(buttons, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, gap));
+  column->Add(BuildButtons(*panel), wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, gap));
   panel->SetSizer(column);
-  wxAcceleratorEntry keys[] = {{wxACCEL_CTRL, 'C', wxID_COPY}, {wxACCEL_CTRL | wxACCEL_SHIFT, 'C', wxID_SELECTALL},
-                               {wxACCEL_CTRL, 'S', wxID_SAVE}, {wxACCEL_NORMAL, WXK_ESCAPE, wxID_CLOSE}, {wxACCEL_CTRL, 'W', wxID_CLOSE}};
-  SetAcceleratorTable(wxAcceleratorTable(static_cast<int>(std::size(keys)), keys));
   SetSize(FromDIP(paths_.size() == 1 ? wxSize(700, 560) : wxSize(900, 560)));
   CentreOnParent();
   tree_->SetFocus();
@@ -91,6 +69,32 @@ InfoFrame::InfoFrame(MainFrame& frame, wxWindow* parent, std::vector<std::string
     }
     summary_ = SummaryOf(files_);
   }, [this] { Finished(); });
+}
+
+wxSizer* InfoFrame::BuildButtons(wxWindow& panel) {
+  auto* buttons = new wxBoxSizer(wxHORIZONTAL);
+  struct Button {
+    wxWindowID id;
+    const char* label;
+    std::function<void()> run;
+  };
+  const Button rows[] = {
+      {wxID_COPY, "&Copy value", [this] { CopyText(tree_->SelectedValue()); }},
+      {wxID_SELECTALL, "Copy &all", [this] { CopyText(wxString::FromUTF8(WholeText())); }},
+      {wxID_SAVE, "&Save as text...", [this] { SaveTextAs(*this, "info.txt", WholeText()); }},
+      {wxID_CLOSE, "C&lose", [this] { Close(); }},
+  };
+  for (const Button& row : rows) {
+    if (row.id == wxID_CLOSE) buttons->AddStretchSpacer();
+    auto* button = new wxButton(&panel, row.id, row.label);
+    buttons->Add(button, wxSizerFlags().Border(wxRIGHT, row.id == wxID_CLOSE ? 0 : FromDIP(6)));
+    Bind(wxEVT_BUTTON, [run = row.run](wxCommandEvent&) { run(); }, row.id);
+    Bind(wxEVT_MENU, [run = row.run](wxCommandEvent&) { run(); }, row.id);
+  }
+  wxAcceleratorEntry keys[] = {{wxACCEL_CTRL, 'C', wxID_COPY}, {wxACCEL_CTRL | wxACCEL_SHIFT, 'C', wxID_SELECTALL},
+                               {wxACCEL_CTRL, 'S', wxID_SAVE}, {wxACCEL_NORMAL, WXK_ESCAPE, wxID_CLOSE}, {wxACCEL_CTRL, 'W', wxID_CLOSE}};
+  SetAcceleratorTable(wxAcceleratorTable(static_cast<int>(std::size(keys)), keys));
+  return buttons;
 }
 
 void InfoFrame::Finished() {
@@ -124,7 +128,7 @@ void InfoFrame::ShowChoice() {
 
 std::string InfoFrame::WholeText() const {
   const int line = list_ == nullptr ? 1 : list_->GetSelection();
-  if (files_.empty() || line == wxNOT_FOUND) return {};
+  if (timer_.IsRunning() || files_.empty() || line == wxNOT_FOUND) return {};  // files are still being read apart
   if (line > 0) return TextOf(files_[static_cast<size_t>(line) - 1]);
   std::string text = TextOf(summary_);
   for (const FileInfo& file : files_) text.append("\n").append(TextOf(file));

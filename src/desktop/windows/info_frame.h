@@ -11,6 +11,7 @@
 #include "desktop/windows/background.h"
 
 class wxListBox;
+class wxSizer;
 class wxStaticText;
 
 namespace fotomill::desktop {
@@ -24,6 +25,7 @@ class InfoFrame : public wxFrame {
   InfoFrame(MainFrame& frame, wxWindow* parent, std::vector<std::string> paths);
 
  private:
+  wxSizer* BuildButtons(wxWindow& panel);
   void Finished();
   void ShowChoice();  // what the list at the left has selected
   std::string WholeText() const;

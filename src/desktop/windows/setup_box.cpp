@@ -101,6 +101,10 @@ SetupBox::SetupBox(wxWindow* parent, std::function<void()> applied, SetupPage fi
   search_->Bind(wxEVT_SEARCH, [this](wxCommandEvent&) { ChooseLine(true); });
   search_->Bind(wxEVT_SEARCH_CANCEL, [this](wxCommandEvent&) { search_->Clear(); });
   list_->Bind(wxEVT_LISTBOX, [this](wxCommandEvent&) { ChooseLine(false); });
+  list_->Bind(wxEVT_SET_FOCUS, [](wxFocusEvent& event) {
+    LogEvent("setup", "list has the keyboard");
+    event.Skip();
+  });
   list_->Bind(wxEVT_LISTBOX_DCLICK, [this](wxCommandEvent&) { ChooseLine(true); });
   BindSettingsHelp(*this);
   CentreOnParent();
