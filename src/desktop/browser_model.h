@@ -52,6 +52,7 @@ class BrowserModel {
   std::vector<std::string> FilesForFunction() const;
   // The same with folders.
   std::vector<std::string> PathsForFunction() const;
+  bool HasPathForFunction() const { return selection_.SelectedCount() > 0 || selection_.Focus() != kNoLine; }
   bool HasFileForFunction() const;
   // All files that are shown, in list order.
   std::vector<std::string> ShownFiles() const;

@@ -107,7 +107,7 @@ bool MainFrame::Enabled(const Command& command) const {
   const BrowserPage* browser = Browser();
   switch (command.needs) {
     case Needs::Files: return browser != nullptr && browser->Model().HasFileForFunction();
-    case Needs::Item: return browser != nullptr && browser->Model().Selected().Focus() != kNoLine;
+    case Needs::Item: return browser != nullptr && browser->Model().HasPathForFunction();
     case Needs::ClosedTab: return HasClosedTab();
     case Needs::Undo: return files_->Undoable().CanUndo() && !files_->Busy();
     case Needs::Redo: return files_->Undoable().CanRedo() && !files_->Busy();

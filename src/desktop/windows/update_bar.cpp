@@ -16,27 +16,32 @@ namespace fotomill::desktop {
 UpdateBar::UpdateBar(wxWindow* parent, std::function<void(int32_t choice)> answered)
     : wxPanel(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTAB_TRAVERSAL | wxBORDER_NONE, "UpdateThumbnailsBox"),
       answered_(std::move(answered)) {
-  SetBackgroundColour(wxSystemSettings::GetColour(wxSYS_COLOUR_INFOBK));
-  SetForegroundColour(wxSystemSettings::GetColour(wxSYS_COLOUR_INFOTEXT));
+  // A tint of the window's own colours, light or dark.
+  const wxColour window = wxSystemSettings::GetColour(wxSYS_COLOUR_WINDOW);
+  const wxColour highlight = wxSystemSettings::GetColour(wxSYS_COLOUR_HIGHLIGHT);
+  const auto tint = [](int from, int to) { return static_cast<unsigned char>(from + (to - from) / 7); };
+  SetBackgroundColour(wxColour(tint(window.Red(), highlight.Red()), tint(window.Green(), highlight.Green()), tint(window.Blue(), highlight.Blue())));
   const int gap = FromDIP(6);
   text_ = new wxStaticText(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxST_ELLIPSIZE_END);
-  text_->SetForegroundColour(GetForegroundColour());
   choices_ = new wxChoice(this, wxID_ANY);
   choices_->SetName(kThumbnailUpdateRequest);
   choices_->SetToolTip(kThumbnailUpdateRequest);
   for (const ThumbnailUpdateChoice& choice : kThumbnailUpdateChoices) {
     choices_->Append(wxControl::RemoveMnemonics(wxString::FromUTF8(choice.text)));
   }
-  choices_->SetMinSize(FromDIP(wxSize(300, -1)));
   auto* ok = new wxButton(this, wxID_OK);
   ok_ = ok;
   auto* close = new wxButton(this, wxID_CLOSE, wxString::FromUTF8("\xC3\x97"), wxDefaultPosition, FromDIP(wxSize(32, -1)), wxBORDER_NONE);
   close->SetToolTip("Close");
-  auto* sizer = new wxBoxSizer(wxHORIZONTAL);
-  sizer->Add(text_, wxSizerFlags(1).CenterVertical().Border(wxLEFT, gap * 2));
-  sizer->Add(choices_, wxSizerFlags(1).CenterVertical().Border(wxALL, gap));
-  sizer->Add(ok_, wxSizerFlags().CenterVertical());
-  sizer->Add(close, wxSizerFlags().CenterVertical().Border(wxLEFT | wxRIGHT, gap));
+  auto* question = new wxBoxSizer(wxHORIZONTAL);
+  question->Add(text_, wxSizerFlags(1).CenterVertical());
+  question->Add(close, wxSizerFlags().CenterVertical());
+  auto* answer = new wxBoxSizer(wxHORIZONTAL);
+  answer->Add(choices_, wxSizerFlags(1));
+  answer->Add(ok_, wxSizerFlags().Border(wxLEFT, gap));
+  auto* sizer = new wxBoxSizer(wxVERTICAL);
+  sizer->Add(question, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxTOP, gap));
+  sizer->Add(answer, wxSizerFlags().Expand().Border(wxALL, gap));
   SetSizer(sizer);
   ok->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) {
     answered_(kThumbnailUpdateChoices[static_cast<size_t>(choices_->GetSelection())].value);
@@ -53,14 +58,14 @@ void UpdateBar::Ask(int32_t count, int32_t selected) {
   }
   choices_->Show();
   ok_->Show();
-  Layout();
+  GetParent()->Layout();
 }
 
 void UpdateBar::Tell(const wxString& text) {
   text_->SetLabel(text);
   choices_->Hide();
   ok_->Hide();
-  Layout();
+  GetParent()->Layout();
 }
 
 }  // namespace fotomill::desktop
