@@ -127,7 +127,12 @@ class Desktop:
             windows = self.xdotool("search", "--onlyvisible", "--name", title)
             if windows:
                 self.xdotool("windowraise", windows[-1])
-                self.xdotool("windowfocus", "--sync", windows[-1])
+                if self.xdotool("getwindowfocus") != windows[-1:]:
+                    known = self.log_text().count(" active ")
+                    self.xdotool("windowfocus", "--sync", windows[-1])
+                    # Keys that come before the program knows of it go nowhere.
+                    while self.log_text().count(" active ") == known and time.monotonic() < end:
+                        time.sleep(0.03)
                 return windows[-1]
             time.sleep(0.05)
         raise Failure(f"there is no window {title}")

@@ -67,6 +67,15 @@ class App : public wxApp {
     return true;
   }
 
+  // The log is told which window has the keyboard.
+  int FilterEvent(wxEvent& event) override {
+    if (EventLogOn() && event.GetEventType() == wxEVT_ACTIVATE && static_cast<wxActivateEvent&>(event).GetActive()) {
+      const auto* window = dynamic_cast<wxTopLevelWindow*>(event.GetEventObject());
+      if (window != nullptr) LogEvent("active", Utf8(window->GetTitle()));
+    }
+    return Event_Skip;
+  }
+
   int OnExit() override {
     RunFormatShutdown();
     return wxApp::OnExit();
