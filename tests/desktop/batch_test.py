@@ -80,7 +80,7 @@ def errors_stay_and_abort_stops(folder):
         start_convert(desktop)
         confirm(desktop)
         desktop.wait(r"batch-line .*a.gif: ")
-        desktop.focus("^Progress$")
+        desktop.focus("^Progress$", settle=False)
         desktop.key("alt+a")
         desktop.wait(r"batch-line There were errors")
         line = desktop.wait(r"batch-line \d+ files were processed")

@@ -120,8 +120,9 @@ class Desktop:
         done = subprocess.run(["xdotool", *map(str, arguments)], env=self.environment, capture_output=True, text=True)
         return done.stdout.split()
 
-    def focus(self, title):
-        """Gives the keyboard to the window of a title: there is no window manager to do it."""
+    def focus(self, title, settle=True):
+        """Gives the keyboard to the window of a title: there is no window manager to do it. Waits until the window has been
+        drawn, unless it is one that goes on changing."""
         end = time.monotonic() + PATIENCE
         while time.monotonic() < end:
             windows = self.xdotool("search", "--onlyvisible", "--name", title)
@@ -133,6 +134,8 @@ class Desktop:
                     # Keys that come before the program knows of it go nowhere.
                     while self.log_text().count(" active ") == known and time.monotonic() < end:
                         time.sleep(0.03)
+                if settle:
+                    self.settle()
                 return windows[-1]
             time.sleep(0.05)
         raise Failure(f"there is no window {title}")

@@ -160,7 +160,7 @@ constexpr Command kCommands[] = {
     {kFunctions, nullptr},
     {kFunctions, "C&opy to...",    "F7",           "Copies the selected files to a folder.", Needs::Item, CopySelectionTo, "copy", true},
     {kFunctions, "&Move to...",    "F6",           "Moves the selected files to a folder.", Needs::Item, MoveSelectionTo, "move", true},
-    {kFunctions, "&Rename...",     "Shift+F2",     "Numbers the selected files.", Needs::Files, RenameSelectionSequentially, "rename", true},
+    {kFunctions, "&Rename...",     "Shift+F2",     "Numbers the selected files.", Needs::Files, RenameSelectionSequentially, "rename"},
     {kFunctions, "&Delete",        "Delete",       "Moves the selected files to the trash.", Needs::Item, TrashSelection, "trash", true},
     {kFunctions, "Delete for &good...", "Shift+Delete", "Deletes the selected files; this cannot be undone.", Needs::Item, DeleteSelection},
 

@@ -26,6 +26,7 @@ namespace {
 
 constexpr double kTimeLeftAfter = 3;  // seconds
 constexpr int kThumbnailSide = 48;
+constexpr int kNewsMs = 40;  // what comes is gathered for so long
 
 wxString TimeLeft(double seconds) {
   const long whole = std::lround(std::ceil(seconds));
@@ -114,7 +115,8 @@ ProgressWindow::ProgressWindow(wxWindow* frame, ThumbnailService& thumbnails, Ev
       events_(std::move(events)),
       thumbnails_(thumbnails),
       settings_(ProgressSettingsInForce()),
-      started_(platform::MonotonicSeconds()) {
+      started_(platform::MonotonicSeconds()),
+      newsTimer_(this) {
   panel_ = new wxPanel(this);
   list_ = MakeList(false);
   status_ = new wxStaticText(panel_, kProgressStatusId, "", wxDefaultPosition, wxDefaultSize,
@@ -133,6 +135,7 @@ ProgressWindow::ProgressWindow(wxWindow* frame, ThumbnailService& thumbnails, Ev
     SetStatus("Stopping after the files in work...");
     events_.abort();
   });
+  Bind(wxEVT_TIMER, [this](wxTimerEvent&) { ShowNews(); });
   close_->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { events_.closed(); });
   copy_->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { CopyList(); });
   select_->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { events_.selectFailed(FailedFiles()); });
@@ -194,36 +197,43 @@ void ProgressWindow::ShowFrom(int row, int selected) {
 
 void ProgressWindow::AddLine(const ProgressLine& line, const std::string& source) {
   rows_.push_back({line, source});
-  RowAdded();
-}
-
-void ProgressWindow::RowAdded() {
-  if (drawn_ != nullptr) {
-    drawn_->SetItemCount(rows_.size());
-    drawn_->ScrollToRow(rows_.size() - 1);
-    drawn_->Refresh();
-  } else {
-    plain_->Append(Shown(rows_.back().line.text));
-    plain_->EnsureVisible(static_cast<int>(rows_.size()) - 1);
-  }
+  if (!newsTimer_.IsRunning()) newsTimer_.StartOnce(kNewsMs);
 }
 
 void ProgressWindow::SetStatus(const std::string& status) {
   text_ = status;
-  status_->SetLabel(Shown(text_));
+  if (!newsTimer_.IsRunning()) newsTimer_.StartOnce(kNewsMs);
 }
 
 void ProgressWindow::SetProgress(uint32_t done, uint32_t count) {
-  bar_->SetRange(static_cast<int>(std::max(count, 1u)));
-  bar_->SetValue(static_cast<int>(done));
+  fileDone_ = done;
+  fileCount_ = count;
+  if (!newsTimer_.IsRunning()) newsTimer_.StartOnce(kNewsMs);
+}
+
+void ProgressWindow::ShowNews() {
+  if (drawn_ != nullptr && drawn_->GetItemCount() != rows_.size()) {
+    drawn_->SetItemCount(rows_.size());
+    drawn_->ScrollToRow(rows_.size() - 1);
+    drawn_->Refresh();
+  }
+  if (plain_ != nullptr && plain_->GetCount() != rows_.size()) {
+    for (size_t row = plain_->GetCount(); row < rows_.size(); ++row) plain_->Append(Shown(rows_[row].line.text));
+    plain_->EnsureVisible(static_cast<int>(rows_.size()) - 1);
+  }
+  bar_->SetRange(static_cast<int>(std::max(fileCount_, 1u)));
+  bar_->SetValue(static_cast<int>(fileDone_));
   const double passed = platform::MonotonicSeconds() - started_;
-  if (passed < kTimeLeftAfter || done == 0 || done >= count || !abort_->IsEnabled()) return;
-  status_->SetLabel(Shown(text_) + TimeLeft(passed / done * (count - done)));
+  const bool tells = passed >= kTimeLeftAfter && fileDone_ > 0 && fileDone_ < fileCount_ && abort_->IsEnabled();
+  const wxString left = tells ? TimeLeft(passed / fileDone_ * (fileCount_ - fileDone_)) : wxString();
+  status_->SetLabel(Shown(text_) + left);
 }
 
 // The list is made anew with a scroll bar that always shows, at the same place and with the same rows in sight.
 void ProgressWindow::StayOpen() {
   done_ = true;
+  newsTimer_.Stop();
+  ShowNews();
   const int first = FirstVisible();
   wxWindow* old = list_;
   const wxRect place = old->GetRect();

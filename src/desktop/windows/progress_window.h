@@ -2,6 +2,7 @@
 
 #include <wx/frame.h>
 #include <wx/gauge.h>
+#include <wx/timer.h>
 
 #include <functional>
 #include <string>
@@ -41,7 +42,8 @@ class ProgressWindow : public wxFrame {
   };
   wxWindow* MakeList(bool scrollBar);
   void LayOut();
-  void RowAdded();
+  // Shows what has come since the last time: many lines at once cost as much as one.
+  void ShowNews();
   void CopyList();
   std::vector<std::string> FailedFiles() const;
   int FirstVisible() const;
@@ -54,6 +56,8 @@ class ProgressWindow : public wxFrame {
   double started_ = 0;
   bool done_ = false;
   std::string text_;  // of the status line, without the time left
+  uint32_t fileDone_ = 0, fileCount_ = 0;
+  wxTimer newsTimer_;
   wxWindow* panel_ = nullptr;
   wxWindow* list_ = nullptr;
   DrawnList* drawn_ = nullptr;  // the list, when the box draws it

@@ -407,7 +407,6 @@ void ThumbnailCanvas::OnMouseDown(wxMouseEvent& event) {
   // A press on a selected line may begin a drag of all; what a plain click does is done when the button goes up.
   if (selection.IsSelected(line) && !event.ControlDown() && !event.ShiftDown()) return;
   selection.Click(line, event.ShiftDown(), event.ControlDown());
-  pressedLine_ = kNoLine == line ? kNoLine : line;
   TellSelection();
 }
 
