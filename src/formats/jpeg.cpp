@@ -461,6 +461,7 @@ Status JpegRead(PictureRecord& picture, const char* fileName) {
   RETURN_IF_BAD(ReadPixels(reader, picture, image));
   if (!file.Intact()) return Status::FileReadError;
   picture.warning.AssignCut(reader.errors.warning);
+  picture.reduction = static_cast<int32_t>(reader.info.scale_denom / reader.info.scale_num);
   picture.image = std::move(image);
   return Status::Ok;
 }

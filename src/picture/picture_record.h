@@ -92,6 +92,8 @@ struct PictureRecord {
   int32_t thumbnailSide = 0;  // above 0: a decoder may deliver any smaller size that is still twice that of the largest
                               // picture inside this square, which is what its longer edge decides; `width` and `height`
                               // keep the full size, `image` tells its own
+  int32_t reduction = 1;      // how many pixels along each edge one of such an image stands for; the last column and row
+                              // may stand for fewer
   ProgressSink* progress = nullptr;   // not owned, may be null
 
   void ReportRow(int32_t done) const { ReportRow(done, height); }

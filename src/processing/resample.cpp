@@ -30,10 +30,8 @@ struct Blocks {
   }
   int32_t First(int32_t i) const { return std::max(i * block - overhang, 0); }
   int32_t End(int32_t i, int32_t sourceCount) const { return std::min(i * block - overhang + block, sourceCount); }
-  // The edge in blocks, for the filter.
-  SourceEdge Edge(int32_t sourceCount) const {
-    return {count, static_cast<double>(overhang) / block, static_cast<double>(sourceCount) / block};
-  }
+  // The edge in blocks, for the filter; `reach` pixels belong to the picture.
+  SourceEdge Edge(double reach) const { return {count, static_cast<double>(overhang) / block, reach / block}; }
 };
 
 bool IsOpaque(const PackedImage& alpha) {
@@ -129,7 +127,7 @@ void SplitAlpha(const int16_t* pixels, int32_t width, uint8_t* bgr, uint8_t* alp
 // first.
 class Resampling {
  public:
-  Status Open(const PackedImage& image, const PackedImage* alpha, Size size, ScaleFilter filter) {
+  Status Open(const PackedImage& image, const PackedImage* alpha, Reach reach, Size size, ScaleFilter filter) {
     image_ = &image;
     const Blocks columns(image.Width(), size.width), rows(image.Height(), size.height);
     lastRow_ = rows.count - 1;
@@ -140,9 +138,8 @@ class Resampling {
     // Rows of a 24-bit picture can be weighed as they lie.
     direct_ = !acrossFirst_ && image.Bits() == 24 && alpha == nullptr && columns.block == 1 && rows.block == 1 &&
               samples >= kWeighedAtOnce;
-    RETURN_IF_BAD(across_.Make(columns.Edge(image.Width()), size.width, filter, kMostShortShift));
-    RETURN_IF_BAD(
-        down_.Make(rows.Edge(image.Height()), size.height, filter, direct_ ? kMostByteShift : kMostShortShift));
+    RETURN_IF_BAD(across_.Make(columns.Edge(reach.width), size.width, filter, kMostShortShift));
+    RETURN_IF_BAD(down_.Make(rows.Edge(reach.height), size.height, filter, direct_ ? kMostByteShift : kMostShortShift));
     if (!direct_) RETURN_IF_BAD(source_.Open(image, alpha, columns, rows));
     held_ = down_.MostTaps();
     stride_ = direct_ ? samples : (samples + kSpare + kWeighedAtOnce - 1) / kWeighedAtOnce * kWeighedAtOnce;
@@ -228,6 +225,12 @@ class Resampling {
 
 Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Size size, ScaleFilter filter,
                      PackedImage& scaled, PackedImage& scaledAlpha, ProgressSink* progress) {
+  const Reach all{static_cast<double>(image.Width()), static_cast<double>(image.Height())};
+  return ScaleFiltered(image, alpha, all, size, filter, scaled, scaledAlpha, progress);
+}
+
+Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Reach reach, Size size, ScaleFilter filter,
+                     PackedImage& scaled, PackedImage& scaledAlpha, ProgressSink* progress) {
   scaled.Free();
   scaledAlpha.Free();
   if (image.Empty()) return Status::DamagedFile;
@@ -241,7 +244,7 @@ Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Size si
     const bool blended = !alpha.Empty() && !IsOpaque(alpha);
     if (!alpha.Empty() && !blended) std::memset(madeAlpha.Rows().data(), 255, madeAlpha.Rows().size());
     Resampling work;
-    RETURN_IF_BAD(work.Open(image, blended ? &alpha : nullptr, size, filter));
+    RETURN_IF_BAD(work.Open(image, blended ? &alpha : nullptr, reach, size, filter));
     for (int32_t y = 0; y < size.height; ++y) {
       work.ScaleRow(y, made.Row(y), blended ? madeAlpha.Row(y) : std::span<uint8_t>());
       if (progress != nullptr) progress->Step(y + 1, size.height);

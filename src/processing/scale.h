@@ -46,6 +46,13 @@ Status ScalePictureByPercentage(PictureRecord& picture, int32_t percentage);
 Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Size size, ScaleFilter filter,
                      PackedImage& scaled, PackedImage& scaledAlpha, ProgressSink* progress = nullptr);
 
+// The same of a picture that ends within the last column and row of its image, as a reduced decode leaves it.
+struct Reach {
+  double width, height;  // of the picture, in pixels of the image
+};
+Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Reach reach, Size size, ScaleFilter filter,
+                     PackedImage& scaled, PackedImage& scaledAlpha, ProgressSink* progress = nullptr);
+
 // The same for a picture, whose `width`, `height` and `bitsPerPixel` follow. On failure the picture is unchanged.
 Status ScalePicture(PictureRecord& picture, Size size, ScaleFilter filter);
 

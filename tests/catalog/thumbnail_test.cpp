@@ -1,10 +1,12 @@
 #include <gmock/gmock.h>
 #include <sys/stat.h>
 
+#include <cmath>
 #include <nlohmann/json.hpp>
 
 #include "catalog/thumbnail_file.h"
 #include "core/settings.h"
+#include "formats/jpeg.h"
 #include "support/bitmaps.h"
 #include "support/codecs.h"
 #include "support/command_line.h"
@@ -93,6 +95,25 @@ TEST(ThumbnailRecord, KeepsRowsUpright) {
   PackedImage bitmap;
   ASSERT_EQ(ThumbnailRecordToBitmap(record, bitmap), Status::Ok);
   EXPECT_TRUE(SamePixels(bitmap, picture->image));
+}
+
+// A reduced decode of 1,601 pixels has 201, of which the last stands for one pixel only.
+TEST(ThumbnailRecord, IsTheSameFromAReducedDecode) {
+  PicturePointer picture = MakePicture(1601, 1603, 24);
+  for (int32_t y = 0; y < 1603; ++y) {
+    for (int32_t x = 0; x < 1601; ++x) {
+      const auto wave = [](int32_t at) { return static_cast<int32_t>(128 + 100 * std::sin(at * 0.06)); };
+      SetPixel(picture->image, x, y, wave(x) << 16 | wave(y) << 8);
+    }
+  }
+  const TemporaryFolder folder;
+  WriteBytes(folder.Path("a.jpg"), Encode(JpegWrite, *picture));
+  ThumbnailRecord reduced, full;
+  ASSERT_EQ(MakeThumbnailOfFile(folder.Path("a.jpg"), reduced), Status::Ok);
+  ASSERT_TRUE(MakeThumbnailRecord(full, *picture));
+  int largest = 0;
+  for (size_t i = kThumbnailHeaderSize; i < full.bytes.size(); ++i) largest = std::max(largest, std::abs(full.bytes[i] - reduced.bytes[i]));
+  EXPECT_LE(largest, 8);
 }
 
 TEST(ThumbnailRecord, BlendsAlpha) {
