@@ -119,5 +119,16 @@ TEST(Jpeg, ThumbnailsDecodeAtTheSmallestSizeThatServes) {
   }
 }
 
+TEST(Jpeg, SaysWhatNoSegmentHolds) {
+  const PicturePointer picture = PatternPicture(8, 8, 24);
+  picture->metadata.exif.assign(70000, 1);
+  picture->metadata.xmp.assign(70000, 'x');
+  picture->metadata.icc.assign(70000, 2);  // goes into two
+  const Decoded back = Decode(JpegRead, Encode(JpegWrite, *picture));
+  EXPECT_EQ(picture->lostMetadata, kLostExif | kLostXmp);
+  EXPECT_TRUE(back.picture->metadata.exif.empty());
+  EXPECT_EQ(back.picture->metadata.icc, picture->metadata.icc);
+}
+
 }  // namespace
 }  // namespace fotomill::test
