@@ -55,7 +55,7 @@ TEST(SetupPages, SearchFindsEveryWord) {
       {"jpegcompression", KeyNumber::JpegCompression, 2},
       {"JPEG quality", KeyNumber::JpegCompression, 3},
       {"  upright   camera ", KeyNumber::ExifAdjustOrientation, 1},
-      {"trash", KeyNumber::OverwritePromptRecycle, 2},
+      {"trash", KeyNumber::OverwritePromptRecycle, 3},
   };
   for (const Row& row : rows) {
     SCOPED_TRACE(row.words);

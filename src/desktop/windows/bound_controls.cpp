@@ -27,11 +27,11 @@ wxString AsCharacters(std::string_view text) {
 }  // namespace
 
 void BoundControls::SetChecked(uint32_t control, bool checked) {
-  if (auto* box = wxDynamicCast(Find(control), wxCheckBox)) box->SetValue(checked);
+  if (auto* box = dynamic_cast<wxCheckBox*>(Find(control))) box->SetValue(checked);
 }
 
 bool BoundControls::IsChecked(uint32_t control) const {
-  const auto* box = wxDynamicCast(Find(control), wxCheckBox);
+  const auto* box = dynamic_cast<wxCheckBox*>(Find(control));
   return box != nullptr && box->IsChecked();
 }
 
@@ -45,9 +45,9 @@ void BoundControls::SetText(uint32_t control, std::string_view text) {
   }
   if (auto* mask = dynamic_cast<MaskList*>(window)) {
     mask->SetMask(ParseNumber<int32_t>(text).value_or(0));
-  } else if (auto* spin = wxDynamicCast(window, wxSpinCtrl)) {
+  } else if (auto* spin = dynamic_cast<wxSpinCtrl*>(window)) {
     spin->SetValue(ParseNumber<int32_t>(text).value_or(0));
-  } else if (auto* field = wxDynamicCast(window, wxTextCtrl)) {
+  } else if (auto* field = dynamic_cast<wxTextCtrl*>(window)) {
     field->ChangeValue(shown);
   }
 }
@@ -55,9 +55,9 @@ void BoundControls::SetText(uint32_t control, std::string_view text) {
 std::string BoundControls::Text(uint32_t control) const {
   wxWindow* const window = Find(control);
   if (const auto* mask = dynamic_cast<const MaskList*>(window)) return std::to_string(mask->Mask());
-  if (const auto* spin = wxDynamicCast(window, wxSpinCtrl)) return Utf8(spin->GetTextValue());
-  if (const auto* label = wxDynamicCast(window, wxStaticText)) return Utf8(label->GetLabelText());
-  const auto* field = wxDynamicCast(window, wxTextCtrl);
+  if (const auto* spin = dynamic_cast<wxSpinCtrl*>(window)) return Utf8(spin->GetTextValue());
+  if (const auto* label = dynamic_cast<wxStaticText*>(window)) return Utf8(label->GetLabelText());
+  const auto* field = dynamic_cast<wxTextCtrl*>(window);
   if (field == nullptr) return {};
   const auto foreign = foreignTexts_.find(control);
   const bool unchanged = foreign != foreignTexts_.end() && foreign->second.second == field->GetValue();
@@ -65,11 +65,11 @@ std::string BoundControls::Text(uint32_t control) const {
 }
 
 void BoundControls::LimitText(uint32_t control, size_t bytes) {
-  if (auto* field = wxDynamicCast(Find(control), wxTextCtrl)) field->SetMaxLength(static_cast<unsigned long>(bytes));
+  if (auto* field = dynamic_cast<wxTextCtrl*>(Find(control))) field->SetMaxLength(static_cast<unsigned long>(bytes));
 }
 
 void BoundControls::SetRange(uint32_t control, const SpinRange& range) {
-  auto* spin = wxDynamicCast(Find(control), wxSpinCtrl);
+  auto* spin = dynamic_cast<wxSpinCtrl*>(Find(control));
   if (spin == nullptr) return;
   spin->SetRange(range.minimum, range.maximum);
   spin->SetIncrement(range.step);
@@ -85,7 +85,7 @@ int32_t BoundControls::Colour(uint32_t control) const {
 }
 
 void BoundControls::SetChoices(uint32_t control, std::span<const std::string> texts) {
-  auto* choice = wxDynamicCast(Find(control), wxChoice);
+  auto* choice = dynamic_cast<wxChoice*>(Find(control));
   if (choice == nullptr) return;
   wxArrayString items;
   for (const std::string& text : texts) items.Add(Shown(text));
@@ -94,11 +94,11 @@ void BoundControls::SetChoices(uint32_t control, std::span<const std::string> te
 }
 
 void BoundControls::Select(uint32_t control, int32_t position) {
-  if (auto* choice = wxDynamicCast(Find(control), wxChoice)) choice->SetSelection(position);
+  if (auto* choice = dynamic_cast<wxChoice*>(Find(control))) choice->SetSelection(position);
 }
 
 int32_t BoundControls::Selected(uint32_t control) const {
-  const auto* choice = wxDynamicCast(Find(control), wxChoice);
+  const auto* choice = dynamic_cast<wxChoice*>(Find(control));
   return choice == nullptr ? -1 : choice->GetSelection();
 }
 

@@ -107,6 +107,11 @@ SetupBox::SetupBox(wxWindow* parent, std::function<void()> applied, SetupPage fi
   });
   list_->Bind(wxEVT_LISTBOX_DCLICK, [this](wxCommandEvent&) { ChooseLine(true); });
   BindSettingsHelp(*this);
+  Bind(wxEVT_CHAR_HOOK, [this](wxKeyEvent& event) {
+    if (event.GetKeyCode() != 'F' || event.GetModifiers() != wxMOD_CONTROL) return event.Skip();
+    search_->SetFocus();
+    LogEvent("setup", "search");
+  });
   CentreOnParent();
   list_->SetFocus();
 }
