@@ -27,7 +27,9 @@ namespace {
 
 constexpr int kMostLostRaces = 100;
 constexpr int32_t kPageDigits = 5;
-constexpr size_t kCellsAhead = 64;  // cells that may wait for those before them
+// Cells that may wait for those before them: so many, and fewer when they are large.
+constexpr size_t kCellsAhead = 64;
+constexpr uint64_t kBytesAhead = uint64_t{64} << 20;
 
 // The path of the next page that nobody has; false when the numbers are used up.
 bool NextPageName(BatchJob& job, std::string& path) {
@@ -59,13 +61,17 @@ class ContactSheet {
   }
 
   void Run() {
+    const uint32_t jobs = options_.jobs == 0 ? platform::CoreCount() : options_.jobs;
+    const uint64_t cellBytes = uint64_t{3} * static_cast<uint32_t>(options_.look.cellWidth) * static_cast<uint32_t>(options_.look.cellHeight);
+    const uint64_t room = kBytesAhead / std::max<uint64_t>(cellBytes, 1);
     OrderedRun run({.work = [this](size_t i) { Work(i); },
                     .deliver = [this](size_t i) { Deliver(i); },
                     .goesOn = [this] { return !ended_ && !AbortAsked(); },
                     .tick = [this] { Tick(); },
-                    .ahead = kCellsAhead});
-    run.Run(files_.size(), options_.jobs == 0 ? platform::CoreCount() : options_.jobs);
-    if (!ended_ && !AbortAsked()) EndPage();
+                    .ahead = std::max<size_t>(std::min<uint64_t>(room, kCellsAhead), size_t{jobs} + 1)});
+    run.Run(files_.size(), jobs);
+    if (ended_ || AbortAsked()) GiveUpPage();
+    EndPage();
   }
 
  private:
@@ -134,15 +140,18 @@ class ContactSheet {
   void EndPage() {
     Status status = Status::Ok;
     std::string path;
+    const uint32_t writeAborts = job_.writeAborts;
     if (page_ != nullptr) status = WriteCataloguePage(*page_, options_.page, job_, path);
+    const bool noName = job_.writeAborts != writeAborts;
     for (FileOutcome& outcome : waiting_) {
       if (outcome.status == Status::Ok) {
         outcome.status = status;
         outcome.destination = path;
         if (status == Status::FunctionCancelled) {
-          outcome.status = Status::Ok;
+          outcome.status = noName ? Status::ErrorCreatingFile : Status::Ok;
           outcome.skipped = true;
-          outcome.hint = "skipped, with its page.";
+          outcome.hint = noName ? kWriteAborted : "skipped, with its page.";
+          if (noName) outcome.destination.clear();
         }
         if (status == Status::TooManyColors) outcome.hint = options_.reduceHint;
         if (status == Status::ErrorCreatingFile) outcome.hint = "\"" + path + "\" cannot be made.";
@@ -152,6 +161,12 @@ class ContactSheet {
     waiting_.clear();
     page_.reset();
     drawn_ = 0;
+  }
+
+  // Of the files that waited for a page that is not written, those that failed are reported all the same.
+  void GiveUpPage() {
+    std::erase_if(waiting_, [](const FileOutcome& outcome) { return outcome.status == Status::Ok; });
+    page_.reset();
   }
 
   void Tick() {
@@ -189,10 +204,10 @@ Status WriteCataloguePage(PictureRecord& page, const CataloguePageOptions& optio
     std::string name;
     if (!NextPageName(job, name)) return Status::ErrorWritingFile;
     Destination destination;
-    destination.path = PlannedDestination(name, {}, {}, job);
-    path = destination.path;
+    path = destination.path = name;
     if (path.size() > PathText::Capacity()) return Status::InvalidDestination;
     const DestinationAnswer answer = MakeDestinationName(destination, name, "Catalogue page", job, taken, variant, &page);
+    if (destination.noVariant) ++job.writeAborts;
     if (answer == DestinationAnswer::Skip) return Status::FunctionCancelled;
     path = destination.path;
     const FormatEntry& row = FormatRow(job.formatIndex);

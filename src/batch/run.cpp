@@ -102,7 +102,7 @@ class Batch {
     const std::unique_ptr<FileOutcome> outcome = std::move(outcomes_[i]);
     if (outcome == nullptr) return;
     job_.source.AssignCut(outcome->source);
-    const bool written = outcome->status == Status::Ok && !outcome->skipped && !function_.dryRun;
+    const bool written = !outcome->destination.empty() && !outcome->skipped && !function_.dryRun;
     if (written) NoteUse(outcome->source);
     job_.filesChanged = job_.filesChanged || written;
     if (outcome->skipped && outcome->status != Status::Ok) ++job_.writeAborts;
@@ -275,8 +275,10 @@ class Batch {
     const std::lock_guard lock(mutex_);
     // Unless the user said so of this very file, the files of one run never replace each other.
     if (answer == DestinationAnswer::Write && destination.replace && !destination.asked) {
-      const TakenTest ofRun = [&](const std::string& path) { return names_.TakenByRun(path, source); };
-      destination.noVariant = ofRun(destination.path) && !MakeVariant(destination.path, ofRun);
+      if (names_.TakenByRun(destination.path, source)) {
+        destination.replace = destination.recycle = false;
+        destination.noVariant = !MakeVariant(destination.path, [&](const std::string& path) { return names_.Taken(path, source); });
+      }
       if (destination.noVariant) answer = DestinationAnswer::Skip;
     }
     TakeRules();
@@ -319,7 +321,9 @@ class Batch {
 
   FileOutcome Written(const BatchFile& file, const Destination& destination, bool replaces, const PictureRecord& picture) const {
     if (function_.keepTimes && !function_.dryRun && !platform::CopyTimes(file.name, destination.path)) {
-      return Failure(file, Status::ErrorWritingFile, destination.path + " was written, but its time could not be set.");
+      FileOutcome outcome = Failure(file, Status::ErrorWritingFile, "The output was written, but its time could not be set.");
+      outcome.destination = destination.path;
+      return outcome;
     }
     return {.source = file.name, .destination = destination.path, .replaced = replaces, .note = LostMetadata(picture)};
   }

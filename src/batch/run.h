@@ -39,7 +39,8 @@ struct BatchFunction {
 // Runs a function over a selection: opens the job's progress box, asks what has to be asked, converts, reports every file
 // in selection order, gathers what the file history shall know, and finishes the box. Decoding, transforming and encoding
 // go on on several threads; everything else happens on the calling thread in the order of the selection, so that outputs,
-// names, questions and lines are those of a run with one. After Abort nothing new is begun, and what is in work is finished
+// names, questions and lines are those of a run with one; only a name typed into a question may be refused for a later file
+// that has taken it meanwhile. After Abort nothing new is begun, and what is in work is finished
 // or leaves nothing behind. Ok, or FunctionCancelled when the user did not want it to begin.
 Status RunBatch(std::span<const BatchFile> files, const BatchFunction& function, BatchJob& job);
 

@@ -85,7 +85,7 @@ FileOutcome RenameOne(const BatchFile& file, const SequentialRenameRules& rules,
     outcome.hint = RenameHint(outcome.destination, job);
   } else if (outcome.destination == file.name) {
     outcome.skipped = true;
-    outcome.hint = "skipped, its new name is taken.";
+    outcome.hint = "skipped, it cannot have its new name.";
   } else if (log != nullptr) {
     const bool noted = log->Add({platform::AbsolutePath(file.name), platform::AbsolutePath(outcome.destination)});
     if (!noted) outcome.note = kNotSafe;
@@ -141,11 +141,11 @@ Status RenameSequentially(BatchJob& job, std::string& path, const SequentialRena
       job.filesChanged = true;
       return Status::Ok;
     }
-    if (result == platform::CommitResult::Failed) return Status::RenameError;  // no other number would do better
     if (rules.skipColliding) {
       path = old;
       return Status::Ok;
     }
+    if (result == platform::CommitResult::Failed) return Status::RenameError;  // no other number would do better
   }
   return Status::RenameError;
 }
@@ -184,7 +184,7 @@ void RunRename(std::span<const BatchFile> files, const RenameOptions& options, B
 bool UndoRename(const std::set<std::string>& only, bool dryRun, BatchJob& job) {
   const auto log = ReadRenameLog();
   if (!log) return false;
-  std::vector<RenamedFile> wanted, left;
+  std::vector<RenamedFile> wanted, left, failed;
   for (const RenamedFile& file : *log) (only.empty() || only.contains(file.to) ? wanted : left).push_back(file);
   if (!OpenProgressBox(job)) return true;
   RenamedFiles files(dryRun);
@@ -204,10 +204,11 @@ bool UndoRename(const std::set<std::string>& only, bool dryRun, BatchJob& job) {
       job.uses.push_back(Use(file.from, false));
       job.filesChanged = true;
     }
-    if (outcome.status != Status::Ok) left.push_back(file);
+    if (outcome.status != Status::Ok) failed.push_back(file);
     ReportOutcome(job, outcome, done++, count);
   }
   left.insert(left.end(), wanted.begin(), wanted.end());
+  left.insert(left.end(), failed.rbegin(), failed.rend());  // the last one first again, when it is tried again
   if (dryRun) {
     job.uses.clear();
   } else if (!log->empty() && !WriteRenameLog(left)) {

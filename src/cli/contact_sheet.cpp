@@ -106,7 +106,7 @@ int RunSheet(const SheetOptions& options, const CommandContext& context) {
     return kExitFailed;
   }
   if (!job.uses.empty()) (void)UpdateFileHistory(job.uses);  // a history that cannot be written is no failure
-  return job.errors ? kExitFailed : kExitOk;
+  return job.errors || job.writeAborts > 0 ? kExitFailed : kExitOk;
 }
 
 }  // namespace

@@ -6,6 +6,7 @@
 
 int main(int count, char** arguments) {
   using namespace fotomill;
+  platform::FillStandardStreams();
   platform::CatchTermination();
   platform::KeepFreedMemory();
   cli::Io io;

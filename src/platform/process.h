@@ -12,6 +12,9 @@ std::vector<std::string> ProgramFor(const std::string& file);
 // one's terminal input, output and Ctrl-C. False when it cannot start.
 [[nodiscard]] bool RunProgram(const std::vector<std::string>& arguments, bool wait);
 
+// Gives the standard streams that the program was started without a place that holds nothing and takes nothing; a file that
+// is opened later would else stand in for one of them, and get its messages. Before anything is opened.
+void FillStandardStreams();
 bool IsTerminal(int stream);  // 0 standard input, 1 output, 2 error
 bool IsStored(int stream);    // goes to a regular file: nobody waits for what is written
 // Waits until the standard input has something to read, or has ended. False when the program was asked to end meanwhile.

@@ -91,6 +91,8 @@ TEST(CataloguePage, FirstFreeNames) {
   BatchJob job;
   job.formatIndex = FindFormatByName("x.bmp");
   job.destinationFolder = folder.Path();
+  job.naming.extensionCase = 1;  // is for names that follow a source's, and makes no page replace another
+  job.overwrite.prompt = false;
   const PicturePointer page = MakePicture(4, 4, 24);
   std::string path;
   for (const char* name : {"Catalog_00001.bmp", "Catalog_00003.bmp"}) {

@@ -120,6 +120,7 @@ TEST_F(Run, FunctionsPutTheirPrefixInFrontBeforeNamesCollide) {
 TEST_F(Run, ASourceWaitsForTheOutputThatTakesItsPlace) {
   // Each file's output is the next one's source, and replaces it: the last output holds the first picture.
   for (const uint32_t jobs : {1u, 4u}) {
+    fs::remove(In("a [1].bmp"));
     WriteBytes(In("a.dib"), BitmapFile(300, 300, 24));
     WriteBytes(In("a.bmp"), BitmapFile(5, 5, 24));
     const std::vector<BatchFile> files{{In("a.dib"), {}, Status::Ok, {}}, {In("a.bmp"), {}, Status::Ok, {}}};

@@ -113,6 +113,23 @@ def terminal(folder):
     expect("Ctrl-C on a terminal", run.end() == 130, run.seen[-200:])
 
 
+def closed_streams(folder):
+    """Without an output to write to, no picture gets what was meant for it."""
+    small = folder / "small"
+    small.mkdir()
+    for i in range(20):
+        (small / f"s{i}.bmp").write_bytes(bitmap(300, 200))
+    (small / "list").write_text("".join(f"{small}/{name}\n" for i in range(20) for name in (f"s{i}.bmp", f"missing{i}.bmp")))
+    for stream in (0, 1, 2):
+        out = folder / f"closed{stream}"
+        subprocess.run([FOTOMILL, "convert", "--files-from", small / "list", "--to", "bmp", "--dest", out, "-j", "1"],
+                       preexec_fn=lambda: os.close(stream), close_fds=False, capture_output=False,
+                       stdin=None, stdout=None if stream == 1 else subprocess.DEVNULL,
+                       stderr=None if stream == 2 else subprocess.DEVNULL, check=False, timeout=60)
+        sizes = {path.stat().st_size for path in out.iterdir()} if out.exists() else set()
+        expect(f"stream {stream} closed", sizes <= {(small / "s0.bmp").stat().st_size}, sizes)
+
+
 def main():
     with tempfile.TemporaryDirectory() as name:
         folder = Path(name)
@@ -124,6 +141,7 @@ def main():
             for jobs in (1, 4):
                 signalled(folder, number, jobs)
         terminal(folder)
+        closed_streams(folder)
     print("\n".join(faults) if faults else "everything ended as it should")
     return 1 if faults else 0
 

@@ -12,6 +12,7 @@
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
+#include "platform/process.h"
 #include "plugins/plugin_table.h"
 
 namespace fotomill::desktop {
@@ -45,6 +46,7 @@ class App : public wxApp {
   }
 
   bool OnInit() override {
+    platform::FillStandardStreams();
     StartEventLog();
     SetAppName("fotomill-desktop");
     SetAppDisplayName("Fotomill Professional");

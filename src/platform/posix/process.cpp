@@ -116,6 +116,13 @@ bool RunProgram(const std::vector<std::string>& arguments, bool wait) {
   return true;
 }
 
+void FillStandardStreams() {
+  for (const int stream : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO}) {
+    // A file for reading gets the lowest free number, and whoever writes there is told that it failed.
+    if (fcntl(stream, F_GETFD) < 0) (void)open("/dev/null", O_RDONLY);
+  }
+}
+
 bool IsTerminal(int stream) { return isatty(stream) == 1; }
 
 bool IsStored(int stream) {
