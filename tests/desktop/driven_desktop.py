@@ -68,7 +68,7 @@ class Desktop:
     def __exit__(self, kind, error, trace):
         if kind is not None:
             print(self.log_text()[-3000:], file=sys.stderr)
-            print(self.output.read_text()[-3000:], file=sys.stderr)
+            print(self.output.read_text()[:6000], file=sys.stderr)
             self.screenshot("failed-" + Path(sys.argv[0]).stem)
         if self.program.poll() is None:
             self.program.terminate()
