@@ -118,11 +118,11 @@ def closed_streams(folder):
     small = folder / "small"
     small.mkdir()
     for i in range(20):
-        (small / f"s{i}.bmp").write_bytes(bitmap(300, 200))
+        (small / f"s{i}.bmp").write_bytes(bitmap(900, 900))
     (small / "list").write_text("".join(f"{small}/{name}\n" for i in range(20) for name in (f"s{i}.bmp", f"missing{i}.bmp")))
     for stream in (0, 1, 2):
         out = folder / f"closed{stream}"
-        subprocess.run([FOTOMILL, "convert", "--files-from", small / "list", "--to", "bmp", "--dest", out, "-j", "1"],
+        subprocess.run([FOTOMILL, "convert", "--files-from", small / "list", "--to", "bmp", "--dest", out, "-j", "3"],
                        preexec_fn=lambda: os.close(stream), close_fds=False, capture_output=False,
                        stdin=None, stdout=None if stream == 1 else subprocess.DEVNULL,
                        stderr=None if stream == 2 else subprocess.DEVNULL, check=False, timeout=60)
