@@ -1,6 +1,5 @@
 #include "support/codec_target.h"
 
-#include <sys/mman.h>
 #include <unistd.h>
 
 #include <cstdlib>
@@ -9,30 +8,11 @@
 #include "core/limits.h"
 #include "core/settings.h"
 #include "formats/bmp.h"
+#include "support/scratch_file.h"
 
 namespace fotomill::fuzz {
 
 namespace {
-
-// A file in memory that every run fills anew.
-class MemoryFile {
- public:
-  MemoryFile() : handle_(memfd_create("input", 0)), path_("/proc/self/fd/" + std::to_string(handle_)) {}
-  const std::string& Fill(const uint8_t* data, size_t size) {
-    if (ftruncate(handle_, 0) != 0 || pwrite(handle_, data, size, 0) != static_cast<ssize_t>(size)) std::abort();
-    return path_;
-  }
-
- private:
-  int handle_;
-  std::string path_;
-};
-
-// The fuzzer leaves without calling exit handlers: who starts it makes the folder and takes it away again.
-std::string OutputFolder() {
-  const char* folder = std::getenv("TMPDIR");
-  return folder == nullptr ? "/tmp" : folder;
-}
 
 uint32_t Hash(const uint8_t* data, size_t size) {
   uint32_t hash = 2166136261u;
@@ -41,7 +21,7 @@ uint32_t Hash(const uint8_t* data, size_t size) {
 }
 
 void Write(const WriteOperation write, PictureRecord& picture) {
-  static const std::string path = OutputFolder() + "/out-" + std::to_string(getpid());
+  static const std::string path = ScratchPath("out");
   picture.fileName.AssignCut(path);
   (void)write(picture, {});
   unlink(path.c_str());
