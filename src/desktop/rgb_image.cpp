@@ -7,20 +7,12 @@
 #include "core/settings.h"
 #include "metadata/picture_exif.h"
 #include "processing/flatten.h"
+#include "processing/pixel_rows.h"
 #include "processing/promote.h"
 
 namespace fotomill::desktop {
 
 namespace {
-
-// Red and blue change places.
-void SwapRow(const uint8_t* bgr, int32_t width, uint8_t* rgb) {
-  for (int32_t x = 0; x < width; ++x, bgr += 3, rgb += 3) {
-    rgb[0] = bgr[2];
-    rgb[1] = bgr[1];
-    rgb[2] = bgr[0];
-  }
-}
 
 bool Reserve(RgbImage& image, int32_t width, int32_t height) {
   try {
@@ -62,13 +54,13 @@ Status ToRgb(const PackedImage& image, RgbImage& rgb) {
   BgrRows rows;
   RETURN_IF_BAD(rows.Open(image));
   if (!Reserve(rgb, image.Width(), image.Height())) return Status::MemoryAllocationError;
-  for (int32_t y = 0; y < rgb.height; ++y) SwapRow(rows.Row(y), rgb.width, rgb.Row(y));
+  for (int32_t y = 0; y < rgb.height; ++y) SwapColors(rows.Row(y), static_cast<size_t>(rgb.width), rgb.Row(y));
   return Status::Ok;
 }
 
 Status ToPacked(const RgbImage& rgb, PackedImage& image) {
   RETURN_IF_BAD(NewPackedImage(rgb.width, rgb.height, nullptr, 24, image));
-  for (int32_t y = 0; y < rgb.height; ++y) SwapRow(rgb.Row(y), rgb.width, image.Row(y).data());
+  for (int32_t y = 0; y < rgb.height; ++y) SwapColors(rgb.Row(y), static_cast<size_t>(rgb.width), image.Row(y).data());
   return Status::Ok;
 }
 

@@ -7,6 +7,7 @@
 #include "core/settings.h"
 #include "picture/registry.h"
 #include "platform/clock.h"
+#include "processing/pixel_rows.h"
 #include "processing/scale.h"
 
 namespace fotomill::desktop {
@@ -186,14 +187,6 @@ void ViewScaler::Work() {
 
 namespace {
 
-void CopyBgr(const uint8_t* bgr, int32_t count, uint8_t* rgb) {
-  for (int32_t i = 0; i < count; ++i, bgr += 3, rgb += 3) {
-    rgb[0] = bgr[2];
-    rgb[1] = bgr[1];
-    rgb[2] = bgr[0];
-  }
-}
-
 // One row of samples between four pixels each. Positions are in 1/65536 of a source pixel.
 void DrawBetween(const PackedImage& source, const std::vector<int64_t>& columns, int64_t row, uint8_t* rgb) {
   const int32_t y0 = static_cast<int32_t>(row >> 16), y1 = std::min(y0 + 1, source.Height() - 1);
@@ -246,12 +239,12 @@ void DrawView(const PackedImage& source, const ViewTransform& transform, Color b
     }
     const uint8_t* bgr = source.Row(static_cast<int32_t>(row >> 16)).data();
     if (same) {
-      CopyBgr(bgr + 3 * (left - x), right - left, rgb);
+      SwapColors(bgr + 3 * (left - x), static_cast<size_t>(right - left), rgb);
       continue;
     }
     for (const int64_t column : columns) {
-      CopyBgr(bgr + 3 * (column >> 16), 1, rgb);
-      rgb += 3;
+      const uint8_t* pixel = bgr + 3 * (column >> 16);
+      for (int channel = 2; channel >= 0; --channel) *rgb++ = pixel[channel];
     }
   }
 }

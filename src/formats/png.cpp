@@ -205,15 +205,6 @@ Status Describe(PngReader& reader, std::span<const uint8_t> file, PngLayout& lay
   return Status::Ok;
 }
 
-void SplitAlpha(const uint8_t* source, uint8_t* color, uint8_t* alpha, int32_t width) {
-  for (int32_t x = 0; x < width; ++x, source += 4, color += 3) {
-    color[0] = source[0];
-    color[1] = source[1];
-    color[2] = source[2];
-    alpha[x] = source[3];
-  }
-}
-
 void PackNibbles(const uint8_t* source, uint8_t* row, int32_t width) {
   for (int32_t x = 0; x < width; x += 2) {
     *row++ = static_cast<uint8_t>(source[x] << 4 | (x + 1 < width ? source[x + 1] : 0));
@@ -226,7 +217,7 @@ struct PngTarget {
 
 void StoreRow(const PngLayout& layout, const uint8_t* source, int32_t y, PngTarget& target) {
   if (layout.rows == RowForm::WithAlpha) {
-    SplitAlpha(source, target.image.Row(y).data(), target.alpha.Row(y).data(), layout.width);
+    SplitAlpha(source, static_cast<size_t>(layout.width), target.image.Row(y).data(), target.alpha.Row(y).data());
   } else {
     PackNibbles(source, target.image.Row(y).data(), layout.width);
   }
@@ -372,15 +363,12 @@ Status ReadPixels(PngReader& reader, const PngLayout& layout, PictureRecord& pic
   PngTarget target;
   RETURN_IF_BAD(NewPackedImage(layout.width, layout.height, &picture.palette, layout.bitsPerPixel, target.image));
   if (layout.rows == RowForm::WithAlpha) RETURN_IF_BAD(NewAlphaPlane(layout.width, layout.height, target.alpha));
-  if (ReadAtOnce(reader, layout, picture, target)) {
-    picture.image = std::move(target.image);
-    picture.alpha = std::move(target.alpha);
-    return Status::Ok;
+  if (!ReadAtOnce(reader, layout, picture, target)) {
+    // Only now: the library takes memory for rows of whatever width the file claims.
+    if (!PngGuarded(reader.png, [&] { SetConversions(reader, layout); })) return reader.Failure();
+    RETURN_IF_BAD(layout.interlaced ? ReadInterlaced(reader, layout, picture, target)
+                                    : ReadInOrder(reader, layout, picture, target));
   }
-  // Only now: the library takes memory for rows of whatever width the file claims.
-  if (!PngGuarded(reader.png, [&] { SetConversions(reader, layout); })) return reader.Failure();
-  RETURN_IF_BAD(layout.interlaced ? ReadInterlaced(reader, layout, picture, target)
-                                  : ReadInOrder(reader, layout, picture, target));
   picture.image = std::move(target.image);
   picture.alpha = std::move(target.alpha);
   return Status::Ok;
