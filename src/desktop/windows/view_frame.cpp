@@ -10,6 +10,7 @@
 #include <cmath>
 
 #include "catalog/file_history.h"
+#include "core/choice_lists.h"
 #include "core/settings.h"
 #include "core/text.h"
 #include "desktop/event_log.h"
@@ -20,6 +21,7 @@
 #include "desktop/windows/wx_text.h"
 #include "platform/clock.h"
 #include "platform/paths.h"
+#include "processing/scale.h"
 
 namespace fotomill::desktop {
 
@@ -317,7 +319,7 @@ void ViewFrame::PaintCanvas() {
     pixels.width = size.x;
     pixels.height = size.y;
     pixels.bytes.resize(static_cast<size_t>(size.x) * static_cast<size_t>(size.y) * 3);
-    const bool smooth = transform_.Scale() < 2 && settings.ResizeFilter != static_cast<int32_t>(3);
+    const bool smooth = transform_.Scale() < 2 && ScaleFilterFromKey(settings.ResizeFilter) != ScaleFilter::Nearest;
     DrawView(previewing ? preview_ : *BestSource(), transform_, static_cast<Color>(settings.ViewModeBackground), smooth, pixels);
     dc.DrawBitmap(BitmapOf(pixels, scale), 0, 0);
     if (!previewing) LogPaint();
@@ -347,7 +349,7 @@ std::string ViewFrame::StatusLine() const {
   if (shown_->picture == nullptr) return line + ", " + std::string(StatusMessage(shown_->status));
   const PictureRecord& picture = *shown_->picture;
   line += ", " + std::to_string(picture.image.Width()) + " x " + std::to_string(picture.image.Height()) + " pixels, " +
-          SizeText(picture.fileSize, 2) + ", " + std::to_string(std::lround(transform_.Scale() * 100)) + "%";
+          SizeText(picture.fileSize, choice::kSizeFitting) + ", " + std::to_string(std::lround(transform_.Scale() * 100)) + "%";
   if (picture.pageCount > 1) line += ", page " + std::to_string(page_ + 1) + " of " + std::to_string(picture.pageCount);
   return line;
 }
