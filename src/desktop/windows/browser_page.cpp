@@ -30,6 +30,7 @@ namespace {
 
 constexpr int kGatherMs = 300;  // changes of a folder are gathered for so long
 constexpr size_t kMostHistory = 100;
+enum View { kThumbnailView, kDetailsView };  // pages of the book, the second made when it is first shown
 
 }  // namespace
 
@@ -204,7 +205,7 @@ void BrowserPage::TakeListing(FolderListing listing, bool complete) {
     if (line != kNoLine) model_.Selected().SelectOnly(line);
   }
   if (model_.Selected().Focus() == kNoLine && model_.LineCount() > 0) model_.Selected().MoveFocus(0, false, true);
-  if (views_->GetSelection() == 1) {
+  if (ShowsDetails()) {
     details_->ModelChanged();
   } else {
     canvas_->ModelChanged();
@@ -267,11 +268,10 @@ void BrowserPage::StartFacts() {
 void BrowserPage::TakeFacts(const std::vector<std::pair<size_t, FolderItem>>& facts, bool last) {
   for (const auto& [item, known] : facts) model_.SetFacts(item, known);
   const int32_t sort = model_.Modes().sort;
-  const bool order = last && (sort == choice::kSortExifDate || sort == choice::kSortDimensions);
-  if (order) model_.UpdateOrder();
-  if (order) {
+  if (last && (sort == choice::kSortExifDate || sort == choice::kSortDimensions)) {
+    model_.UpdateOrder();
     ShowView();
-  } else if (views_->GetSelection() == 1) {
+  } else if (ShowsDetails()) {
     details_->Refresh();
   }
   if (!last) return;
@@ -340,6 +340,8 @@ void BrowserPage::ShowUpdateBar(bool show) {
 
 // --- what is shown how ---
 
+bool BrowserPage::ShowsDetails() const { return views_->GetSelection() == kDetailsView; }
+
 void BrowserPage::ShowView() {
   const bool details = model_.Modes().view == choice::kViewDetails;
   if (details && details_ == nullptr) {
@@ -352,7 +354,7 @@ void BrowserPage::ShowView() {
     views_->AddPage(details_, "Details");
   }
   const bool hadFocus = canvas_->HasFocus() || (details_ != nullptr && details_->HasFocus());
-  views_->SetSelection(details ? 1 : 0);
+  views_->SetSelection(details ? kDetailsView : kThumbnailView);
   if (details) {
     details_->ModelChanged();
   } else {
@@ -363,20 +365,22 @@ void BrowserPage::ShowView() {
   StartFacts();
 }
 
-void BrowserPage::SetViewMode(int32_t view) {
-  BrowserModes modes = model_.Modes();
-  modes.view = view;
+void BrowserPage::SetModes(const BrowserModes& modes) {
   model_.SetModes(modes);
   ShowView();
   host_.BrowserChanged();
 }
 
+void BrowserPage::SetViewMode(int32_t view) {
+  BrowserModes modes = model_.Modes();
+  modes.view = view;
+  SetModes(modes);
+}
+
 void BrowserPage::SetThumbnailMode(int32_t mode) {
   BrowserModes modes = model_.Modes();
   modes.thumbnails = mode;
-  model_.SetModes(modes);
-  ShowView();
-  host_.BrowserChanged();
+  SetModes(modes);
 }
 
 void BrowserPage::SetSort(int32_t sort, bool descending) {
@@ -391,7 +395,7 @@ void BrowserPage::ChangeSize(int steps) {
 }
 
 void BrowserPage::SelectionChanged() {
-  if (views_->GetSelection() == 1) {
+  if (ShowsDetails()) {
     details_->ShowSelection();
   } else {
     canvas_->ShowLine(model_.Selected().Focus());
@@ -410,7 +414,7 @@ void BrowserPage::FocusName(const std::string& name) {
 void BrowserPage::EditFocusedName() {
   const size_t focus = model_.Selected().Focus();
   if (focus == kNoLine) return;
-  if (views_->GetSelection() == 0) return canvas_->EditName(focus);
+  if (!ShowsDetails()) return canvas_->EditName(focus);
   wxTextEntryDialog dialog(this, "New name:", "Rename", Shown(model_.Line(focus).name));
   if (dialog.ShowModal() == wxID_OK) host_.RenameFile(model_.PathOfLine(focus), Utf8(dialog.GetValue()));
 }
@@ -424,7 +428,7 @@ void BrowserPage::EditFilter() { filter_->SetFocus(); }
 
 void BrowserPage::ApplyFilter() {
   model_.SetFilter(Utf8(filter_->GetValue()));
-  if (views_->GetSelection() == 1) {
+  if (ShowsDetails()) {
     details_->ModelChanged();
   } else {
     canvas_->ModelChanged();
@@ -443,14 +447,14 @@ void BrowserPage::ThumbnailsCame(const std::vector<ThumbnailLoader::Result>& res
 }
 
 void BrowserPage::FocusList() {
-  if (views_->GetSelection() == 1) {
+  if (ShowsDetails()) {
     details_->SetFocus();
   } else {
     canvas_->SetFocus();
   }
 }
 
-size_t BrowserPage::MissingThumbnails() const { return views_->GetSelection() == 1 ? 0 : canvas_->MissingThumbnails(); }
+size_t BrowserPage::MissingThumbnails() const { return ShowsDetails() ? 0 : canvas_->MissingThumbnails(); }
 int64_t BrowserPage::Scroll() const { return canvas_->Scroll(); }
 
 void BrowserPage::Activate(size_t line) {

@@ -83,7 +83,9 @@ class BrowserPage : public wxPanel {
   void StartFacts();
   void TakeFacts(const std::vector<std::pair<size_t, FolderItem>>& facts, bool last);
   bool NeedsFacts() const;
+  bool ShowsDetails() const;
   void ShowView();
+  void SetModes(const BrowserModes& modes);
   void ThumbnailsCame(const std::vector<ThumbnailLoader::Result>& results);
   void Activate(size_t line);
   void BeginDrag();

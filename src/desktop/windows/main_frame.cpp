@@ -33,6 +33,12 @@ constexpr const char* kTitle = "Fotomill Professional";
 constexpr int kHistoryMs = 2000;  // after the last use
 enum StatusField { kCountField, kMessageField, kFieldCount };
 
+// With its key, as menus show it and take it.
+wxString MenuText(const Command& command) {
+  const wxString keys = *command.accelerator == '\0' ? wxString() : wxString("\t") + command.accelerator;
+  return command.text + keys;
+}
+
 }  // namespace
 
 MainFrame::MainFrame()
@@ -70,8 +76,7 @@ void MainFrame::BuildMenus() {
       menu->AppendSeparator();
       continue;
     }
-    const wxString keys = *command.accelerator == '\0' ? wxString() : wxString("\t") + command.accelerator;
-    menu->Append(CommandId(command), command.text + keys, command.help, command.checked != nullptr ? wxITEM_CHECK : wxITEM_NORMAL);
+    menu->Append(CommandId(command), MenuText(command), command.help, command.checked != nullptr ? wxITEM_CHECK : wxITEM_NORMAL);
   }
   SetMenuBar(bar);
   const int last = kFirstCommandId + static_cast<int>(Commands().size()) - 1;
@@ -121,8 +126,7 @@ void MainFrame::ShowContextMenu(wxWindow& window, const wxPoint& place, bool onF
   wxMenu menu;
   for (const Command& command : Commands()) {
     if (command.text == nullptr || !command.inContextMenu) continue;
-    const wxString keys = *command.accelerator == '\0' ? wxString() : wxString("\t") + command.accelerator;
-    menu.Append(CommandId(command), command.text + keys, command.help);
+    menu.Append(CommandId(command), MenuText(command), command.help);
   }
   window.PopupMenu(&menu, place);
 }
@@ -216,9 +220,15 @@ bool MainFrame::RestoreSession() {
 void MainFrame::KeepSession() {
   Session session;
   session.maximized = IsMaximized();
-  const wxSize size = ToDIP(GetSize());
-  session.width = session.maximized ? LoadSession().width : size.x;
-  session.height = session.maximized ? LoadSession().height : size.y;
+  if (session.maximized) {  // the size to come back to is the last one before
+    const Session last = LoadSession();
+    session.width = last.width;
+    session.height = last.height;
+  } else {
+    const wxSize size = ToDIP(GetSize());
+    session.width = size.x;
+    session.height = size.y;
+  }
   session.tab = static_cast<size_t>(std::max(tabs_->GetSelection(), 0));
   for (size_t tab = 0; tab < tabs_->GetPageCount() && settings.RememberOpenWindows != 0; ++tab) {
     const BrowserModel& model = PageAt(tab)->Model();
@@ -314,7 +324,7 @@ void MainFrame::DropFiles(const std::vector<std::string>& files, const std::stri
 
 void MainFrame::SettingsChanged() {
   thumbnails_.Clear();
-  for (size_t tab = 0; tab < tabs_->GetPageCount(); ++tab) PageAt(tab)->Reload();
+  FilesChanged();
 }
 
 void MainFrame::SelectFiles(const std::vector<std::string>& files) {

@@ -197,17 +197,21 @@ void ProgressWindow::ShowFrom(int row, int selected) {
 
 void ProgressWindow::AddLine(const ProgressLine& line, const std::string& source) {
   rows_.push_back({line, source});
-  if (!newsTimer_.IsRunning()) newsTimer_.StartOnce(kNewsMs);
+  GatherNews();
 }
 
 void ProgressWindow::SetStatus(const std::string& status) {
   text_ = status;
-  if (!newsTimer_.IsRunning()) newsTimer_.StartOnce(kNewsMs);
+  GatherNews();
 }
 
 void ProgressWindow::SetProgress(uint32_t done, uint32_t count) {
   fileDone_ = done;
   fileCount_ = count;
+  GatherNews();
+}
+
+void ProgressWindow::GatherNews() {
   if (!newsTimer_.IsRunning()) newsTimer_.StartOnce(kNewsMs);
 }
 

@@ -43,6 +43,7 @@ class ProgressWindow : public wxFrame {
   wxWindow* MakeList(bool scrollBar);
   void LayOut();
   // Shows what has come since the last time: many lines at once cost as much as one.
+  void GatherNews();
   void ShowNews();
   void CopyList();
   std::vector<std::string> FailedFiles() const;
