@@ -1,7 +1,6 @@
 #include "desktop/windows/exif_frame.h"
 
 #include <wx/accel.h>
-#include <wx/button.h>
 #include <wx/dataview.h>
 #include <wx/filedlg.h>
 #include <wx/msgdlg.h>
@@ -13,6 +12,7 @@
 #include "core/text.h"
 #include "desktop/event_log.h"
 #include "desktop/windows/bitmaps.h"
+#include "desktop/windows/button_row.h"
 #include "desktop/windows/text_actions.h"
 #include "desktop/windows/wx_text.h"
 #include "platform/files.h"
@@ -41,13 +41,7 @@ ExifFrame::ExifFrame(wxWindow* parent, const std::string& path)
   middle->Add(list_, wxSizerFlags(1).Expand());
   middle->Add(side, wxSizerFlags().Border(wxLEFT, gap));
 
-  auto* buttons = new wxBoxSizer(wxHORIZONTAL);
-  struct Button {
-    wxWindowID id;
-    const char* label;
-    std::function<void()> run;
-  };
-  const Button rows[] = {
+  const RowButton rows[] = {
       {wxID_COPY, "&Copy value", [this] { CopyText(SelectedValue()); }},
       {wxID_SELECTALL, "Copy &all", [this] { CopyText(wxString::FromUTF8(report_.text)); }},
       {wxID_SAVEAS, "&Save as text...", [this] { SaveTextAs(*this, "exif.txt", report_.text); }},
@@ -55,17 +49,8 @@ ExifFrame::ExifFrame(wxWindow* parent, const std::string& path)
       {wxID_PRINT, "&Print...", [this] { PrintText(*this, GetTitle(), report_.text); }},
       {wxID_CLOSE, "C&lose", [this] { Close(); }},
   };
-  for (const Button& row : rows) {
-    if (row.id == wxID_CLOSE) buttons->AddStretchSpacer();
-    auto* button = new wxButton(panel, row.id, row.label);
-    button->Enable(row.id == wxID_CLOSE);
-    buttons->Add(button, wxSizerFlags().Border(wxRIGHT, row.id == wxID_CLOSE ? 0 : FromDIP(6)));
-    const auto run = [button, action = row.run](wxCommandEvent&) {
-      if (button->IsEnabled()) action();
-    };
-    Bind(wxEVT_BUTTON, run, row.id);
-    Bind(wxEVT_MENU, run, row.id);
-  }
+  wxSizer* buttons = BuildButtonRow(*this, *panel, rows);
+  for (const RowButton& row : rows) FindWindow(row.id)->Enable(row.id == wxID_CLOSE);  // until the file is read
   auto* column = new wxBoxSizer(wxVERTICAL);
   column->Add(problem_, wxSizerFlags().Expand().Border(wxLEFT | wxTOP | wxRIGHT, gap));
   column->Add(middle, wxSizerFlags(1).Expand().Border(wxALL, gap));

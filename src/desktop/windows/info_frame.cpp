@@ -1,7 +1,6 @@
 #include "desktop/windows/info_frame.h"
 
 #include <wx/accel.h>
-#include <wx/button.h>
 #include <wx/listbox.h>
 #include <wx/panel.h>
 #include <wx/sizer.h>
@@ -10,6 +9,7 @@
 
 #include "catalog/file_history.h"
 #include "desktop/event_log.h"
+#include "desktop/windows/button_row.h"
 #include "desktop/windows/main_frame.h"
 #include "desktop/windows/report_tree.h"
 #include "desktop/windows/text_actions.h"
@@ -72,29 +72,16 @@ InfoFrame::InfoFrame(MainFrame& frame, wxWindow* parent, std::vector<std::string
 }
 
 wxSizer* InfoFrame::BuildButtons(wxWindow& panel) {
-  auto* buttons = new wxBoxSizer(wxHORIZONTAL);
-  struct Button {
-    wxWindowID id;
-    const char* label;
-    std::function<void()> run;
-  };
-  const Button rows[] = {
+  const RowButton rows[] = {
       {wxID_COPY, "&Copy value", [this] { CopyText(tree_->SelectedValue()); }},
       {wxID_SELECTALL, "Copy &all", [this] { CopyText(wxString::FromUTF8(WholeText())); }},
       {wxID_SAVE, "&Save as text...", [this] { SaveTextAs(*this, "info.txt", WholeText()); }},
       {wxID_CLOSE, "C&lose", [this] { Close(); }},
   };
-  for (const Button& row : rows) {
-    if (row.id == wxID_CLOSE) buttons->AddStretchSpacer();
-    auto* button = new wxButton(&panel, row.id, row.label);
-    buttons->Add(button, wxSizerFlags().Border(wxRIGHT, row.id == wxID_CLOSE ? 0 : FromDIP(6)));
-    Bind(wxEVT_BUTTON, [run = row.run](wxCommandEvent&) { run(); }, row.id);
-    Bind(wxEVT_MENU, [run = row.run](wxCommandEvent&) { run(); }, row.id);
-  }
   wxAcceleratorEntry keys[] = {{wxACCEL_CTRL, 'C', wxID_COPY}, {wxACCEL_CTRL | wxACCEL_SHIFT, 'C', wxID_SELECTALL},
                                {wxACCEL_CTRL, 'S', wxID_SAVE}, {wxACCEL_NORMAL, WXK_ESCAPE, wxID_CLOSE}, {wxACCEL_CTRL, 'W', wxID_CLOSE}};
   SetAcceleratorTable(wxAcceleratorTable(static_cast<int>(std::size(keys)), keys));
-  return buttons;
+  return BuildButtonRow(*this, panel, rows);
 }
 
 void InfoFrame::Finished() {

@@ -1,0 +1,21 @@
+#pragma once
+
+#include <wx/frame.h>
+#include <wx/sizer.h>
+
+#include <functional>
+#include <span>
+
+namespace fotomill::desktop {
+
+struct RowButton {
+  wxWindowID id;
+  const char* label;
+  std::function<void()> run;
+};
+
+// The buttons at the foot of a frame, on its panel, the one that closes it apart at the right. A button runs when it is pressed
+// and when the frame's accelerators send its number, as long as it is enabled.
+wxSizer* BuildButtonRow(wxFrame& frame, wxWindow& panel, std::span<const RowButton> rows);
+
+}  // namespace fotomill::desktop
