@@ -105,8 +105,7 @@ int RunSheet(const SheetOptions& options, const CommandContext& context) {
     output.Message(output.ShownMessage(options.dest) + ": " + message + (status == Status::ResourceError ? kNoFont : ""));
     return kExitFailed;
   }
-  if (!job.uses.empty()) (void)UpdateFileHistory(job.uses);  // a history that cannot be written is no failure
-  return job.errors || job.writeAborts > 0 ? kExitFailed : kExitOk;
+  return FinishBatch(job);
 }
 
 }  // namespace

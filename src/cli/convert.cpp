@@ -111,8 +111,7 @@ int RunConvert(const ConvertOptions& options, const CommandContext& context) {
     output.Message(output.ShownMessage(options.dest) + ": " + std::string(StatusMessage(status)));
     return kExitFailed;
   }
-  if (!job.uses.empty()) (void)UpdateFileHistory(job.uses);  // a history that cannot be written is no failure
-  return job.errors || job.writeAborts > 0 ? kExitFailed : kExitOk;
+  return FinishBatch(job);
 }
 
 }  // namespace

@@ -1,5 +1,6 @@
 #include "cli/rename.h"
 
+#include <algorithm>
 #include <memory>
 #include <set>
 #include <string>
@@ -54,8 +55,7 @@ int RunRenameCommand(const RenameCommandOptions& options, const CommandContext& 
     if (options.seed >= 0) rename.seed = static_cast<uint64_t>(options.seed);
     RunRename(files, rename, job);
   }
-  if (!job.uses.empty()) (void)UpdateFileHistory(job.uses);  // a history that cannot be written is no failure
-  return job.errors ? kExitFailed : status;
+  return std::max(status, FinishBatch(job));
 }
 
 }  // namespace

@@ -28,4 +28,9 @@ void TerminalBox::ShowElement(const FileOutcome& outcome) {
   output_.Element(element);
 }
 
+int FinishBatch(const BatchJob& job) {
+  if (!job.uses.empty()) (void)UpdateFileHistory(job.uses);  // a history that cannot be written is no failure
+  return job.errors || job.writeAborts > 0 ? kExitFailed : kExitOk;
+}
+
 }  // namespace fotomill::cli

@@ -29,4 +29,7 @@ class TerminalBox : public ProgressBox {
   const bool tellReplaced_;
 };
 
+// Tells the file history what a batch did. The exit status of its command: kExitFailed when a file failed or got no name.
+int FinishBatch(const BatchJob& job);
+
 }  // namespace fotomill::cli
