@@ -42,8 +42,6 @@ Outcome CopyFile(const std::string& from, const std::string& to) {
   return {};
 }
 
-Outcome DeleteTree(const std::string& path, int depth);
-
 Outcome CopyTree(const std::string& from, const std::string& to, int depth) {
   if (!platform::IsFolder(from)) return CopyFile(from, to);
   if (depth > kDeepest) return "Its folders lie too deep in each other.";
@@ -66,8 +64,7 @@ Outcome DeleteTree(const std::string& path, int depth) {
   }
   if (depth > kDeepest) return "Its folders lie too deep in each other.";
   for (const platform::FolderEntry& entry : platform::ListFolder(path).value_or(std::vector<platform::FolderEntry>())) {
-    const std::string inner = platform::JoinFolder(path, entry.name);
-    Outcome outcome = entry.link ? (platform::DeleteFile(inner) ? Outcome() : Outcome("It could not be deleted.")) : DeleteTree(inner, depth + 1);
+    Outcome outcome = DeleteTree(platform::JoinFolder(path, entry.name), depth + 1);
     if (!outcome.empty()) return outcome;
   }
   return platform::DeleteFolder(path) ? Outcome() : Outcome("The folder could not be deleted.");
