@@ -99,10 +99,8 @@ void RegisterCodec(const char* extension, std::initializer_list<int32_t> depths,
   for (const int32_t depth : depths) {
     for (const auto& kind : kContents) {
       const std::string tail = std::string("/") + kind.name + "/" + std::to_string(depth);
-      benchmark::RegisterBenchmark((extension + ("/decode" + tail)).c_str(), Decode, extension, kind.content, depth,
-                                   size);
-      benchmark::RegisterBenchmark((extension + ("/encode" + tail)).c_str(), Encode, extension, kind.content, depth,
-                                   size);
+      benchmark::RegisterBenchmark((extension + ("/decode" + tail)).c_str(), Decode, extension, kind.content, depth, size);
+      benchmark::RegisterBenchmark((extension + ("/encode" + tail)).c_str(), Encode, extension, kind.content, depth, size);
     }
   }
 }

@@ -43,7 +43,8 @@ void CompareLookups(ThumbnailDatabase& database, int64_t count) {
     ThumbnailRecord found;
     int64_t first = 0;
     const auto matches = [&] {
-      return database.ReadDatabaseRecord(first, record) && !record.deleted && record.path == wanted.path && record.volume == wanted.volume;
+      return database.ReadDatabaseRecord(first, record) && !record.deleted && record.path == wanted.path &&
+             record.volume == wanted.volume;
     };
     while (first < count && !matches()) ++first;
     Require(database.Find(wanted.path, wanted.volume, found) == (first < count));

@@ -49,8 +49,7 @@ void TryCodec(const char* extension, const uint8_t* data, size_t size) {
     if (!picture->image.Empty() || !picture->alpha.Empty()) std::abort();
     return;
   }
-  if (info == Status::Ok &&
-      (picture->image.Width() != described->width || picture->image.Height() != described->height)) {
+  if (info == Status::Ok && (picture->image.Width() != described->width || picture->image.Height() != described->height)) {
     std::abort();
   }
   if (CanWrite(row)) Write(row.write, *picture);

@@ -24,8 +24,18 @@ constexpr std::string_view kEllipsis = "\xE2\x80\xA6";
 
 // Tried in this order when a family is missing, and for letters that the family lacks. The first has Arial's widths.
 constexpr std::string_view kOtherFamilies[] = {
-    "Liberation Sans", "Arial",     "Arimo",          "Helvetica",          "Nimbus Sans",     "DejaVu Sans",
-    "Noto Sans",       "Free Sans", "Noto Sans CJK",  "Droid Sans Fallback", "Droid Sans Fallback Full", "WQY Zen Hei",
+    "Liberation Sans",
+    "Arial",
+    "Arimo",
+    "Helvetica",
+    "Nimbus Sans",
+    "DejaVu Sans",
+    "Noto Sans",
+    "Free Sans",
+    "Noto Sans CJK",
+    "Droid Sans Fallback",
+    "Droid Sans Fallback Full",
+    "WQY Zen Hei",
 };
 
 // A font's name as files and people write it: "Liberation Sans" and "LiberationSans-Regular.ttf" are the same.

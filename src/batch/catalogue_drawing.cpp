@@ -11,10 +11,10 @@ namespace fotomill {
 
 namespace {
 
-constexpr int32_t kPictureInset = 2;   // from a cell's corner
-constexpr int32_t kFrameReach = 3;     // the far lines lie this far behind the room's size
+constexpr int32_t kPictureInset = 2;                     // from a cell's corner
+constexpr int32_t kFrameReach = 3;                       // the far lines lie this far behind the room's size
 constexpr int32_t kCaptionTop = 3, kCaptionBottom = 18;  // below the room
-constexpr int32_t kPageMargin = 12;    // around the grid of a page without a size of its own
+constexpr int32_t kPageMargin = 12;                      // around the grid of a page without a size of its own
 constexpr Color kWhite = 0xFFFFFF, kBlack = 0, kDarkGrey = 0x404040, kGrey = 0xA0A0A0;
 
 void FillPixels(PackedImage& page, Rectangle area, Color color) {

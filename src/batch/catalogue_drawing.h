@@ -19,7 +19,7 @@ struct CatalogueLook {
   int32_t cellWidth = 96, cellHeight = 96;  // the room of a picture
   int32_t pageWidth = 0, pageHeight = 0;    // 0: as large as the grid needs
   CellFrame frame = CellFrame::Raised;
-  bool blackText = false;   // names and flat frames are black, not white and grey
+  bool blackText = false;  // names and flat frames are black, not white and grey
   bool names = true;
   Color background = 0x606060;
 };

@@ -56,13 +56,12 @@ class ContactSheet {
   ContactSheet(std::span<const BatchFile> files, const ContactSheetOptions& options, BatchJob& job)
       : files_(files), options_(options), job_(job), cells_(files.size()) {}
 
-  Status OpenFont() {
-    return options_.look.names ? font_.Open(settings.CatalogFontName.view(), kCaptionHeight) : Status::Ok;
-  }
+  Status OpenFont() { return options_.look.names ? font_.Open(settings.CatalogFontName.view(), kCaptionHeight) : Status::Ok; }
 
   void Run() {
     const uint32_t jobs = options_.jobs == 0 ? platform::CoreCount() : options_.jobs;
-    const uint64_t cellBytes = uint64_t{3} * static_cast<uint32_t>(options_.look.cellWidth) * static_cast<uint32_t>(options_.look.cellHeight);
+    const uint64_t cellBytes =
+        uint64_t{3} * static_cast<uint32_t>(options_.look.cellWidth) * static_cast<uint32_t>(options_.look.cellHeight);
     const uint64_t room = kBytesAhead / std::max<uint64_t>(cellBytes, 1);
     OrderedRun run({.work = [this](size_t i) { Work(i); },
                     .deliver = [this](size_t i) { Deliver(i); },
@@ -180,9 +179,9 @@ class ContactSheet {
   BatchJob& job_;
   std::vector<std::unique_ptr<Cell>> cells_;  // done and not yet on a page
   CaptionFont font_;
-  PicturePointer page_;                // the one that is being filled
-  int32_t drawn_ = 0;                  // its cells
-  std::vector<FileOutcome> waiting_;   // files whose page is not written yet
+  PicturePointer page_;               // the one that is being filled
+  int32_t drawn_ = 0;                 // its cells
+  std::vector<FileOutcome> waiting_;  // files whose page is not written yet
   uint32_t reported_ = 0;
   std::atomic<bool> ended_{false};
 };
@@ -220,8 +219,8 @@ Status WriteCataloguePage(PictureRecord& page, const CataloguePageOptions& optio
     if (lostRace) continue;  // the next number, then
     if (status == Status::Ok && !options.dryRun) {
       job.filesChanged = true;
-      job.uses.push_back({platform::AbsolutePath(path), FileFunction::Catalog, kOwnTime,
-                          static_cast<int32_t>(platform::Now()), false});
+      job.uses.push_back(
+          {platform::AbsolutePath(path), FileFunction::Catalog, kOwnTime, static_cast<int32_t>(platform::Now()), false});
     }
     return status;
   }

@@ -18,7 +18,7 @@ constexpr std::string_view kTooLong = "The path would be longer than 260 charact
 
 struct FunctionPrefix {
   FileFunction function;
-  SettingPrefix Settings::* key;
+  SettingPrefix Settings::*key;
 };
 constexpr FunctionPrefix kPrefixes[] = {
     {FileFunction::Annotate, &Settings::PrefixAnnotate},   {FileFunction::Catalog, &Settings::PrefixCatalog},
@@ -49,8 +49,7 @@ bool IsFileName(std::string_view name) { return !name.empty() && name != "." && 
 
 // Asks until the name can be taken or nobody wants one. The extension stays the format's, cased after the source's.
 bool AskName(Destination& destination, const std::string& source, std::string_view title, BatchJob& job) {
-  const std::string extension =
-      CasedExtension(ExtensionOfFormat(job), platform::ExtensionOf(source), job.naming.extensionCase);
+  const std::string extension = CasedExtension(ExtensionOfFormat(job), platform::ExtensionOf(source), job.naming.extensionCase);
   NameQuestion question{std::string(title), source, destination.path, extension, {}};
   const platform::PathParts planned = platform::SplitPath(destination.path);
   const std::string folder = std::string(planned.drive).append(planned.folder);
@@ -147,8 +146,8 @@ std::string CasedExtension(std::string_view formatExtension, std::string_view so
   std::string extension = LowerCase(formatExtension);
   for (size_t i = 0; i < extension.size() && i < sourceExtension.size(); ++i) {
     if (!IsLetter(extension[i]) || !IsLetter(sourceExtension[i])) continue;
-    const bool upper = style == choice::kCaseUpper ||
-                       (style == choice::kCaseOfSource && sourceExtension[i] != LowerCase(sourceExtension[i]));
+    const bool upper =
+        style == choice::kCaseUpper || (style == choice::kCaseOfSource && sourceExtension[i] != LowerCase(sourceExtension[i]));
     if (upper) extension[i] = UpperCase(extension[i]);
   }
   return extension;
@@ -166,8 +165,7 @@ std::string_view ExtensionOfFormat(const BatchJob& job) {
   return FormatRow(job.formatIndex).extension.view();
 }
 
-std::string PlannedDestination(const std::string& source, std::string_view below, std::string_view prefix,
-                               const BatchJob& job) {
+std::string PlannedDestination(const std::string& source, std::string_view below, std::string_view prefix, const BatchJob& job) {
   const platform::PathParts parts = platform::SplitPath(source);
   std::string name(prefix);
   name.append(parts.base).append(1, '.');
@@ -219,9 +217,8 @@ DestinationAnswer SettleUnasked(Destination& destination, const OverwritePolicy&
   return policy.keepBoth || !applyToRest ? KeepBoth(destination, variant) : Replace(destination, policy);
 }
 
-DestinationAnswer MakeDestinationName(Destination& destination, const std::string& source, std::string_view title,
-                                      BatchJob& job, const TakenTest& taken, const VariantMaker& variant,
-                                      const PictureRecord* picture) {
+DestinationAnswer MakeDestinationName(Destination& destination, const std::string& source, std::string_view title, BatchJob& job,
+                                      const TakenTest& taken, const VariantMaker& variant, const PictureRecord* picture) {
   const FormatEntry& row = FormatRow(job.formatIndex);
   if ((row.flags & FMT_CLIPBOARD) != 0) {
     destination.path = kClipboardName;

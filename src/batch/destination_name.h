@@ -45,13 +45,13 @@ bool MakeNumberedVariant(std::string& path, int64_t first, int64_t last, const T
 // The name of an output as it was settled.
 struct Destination {
   std::string path;
-  bool replace = false;      // a file of that name is to be replaced
-  bool recycle = false;      // and goes to the recycle bin
-  bool asked = false;        // because the user said so of this very file
-  std::string password;      // empty: none
-  bool elsewhere = false;    // the user chose another folder for it, which is not made
-  bool taken = false;        // the name was not free
-  bool noVariant = false;    // skipped because no numbered variant is free
+  bool replace = false;    // a file of that name is to be replaced
+  bool recycle = false;    // and goes to the recycle bin
+  bool asked = false;      // because the user said so of this very file
+  std::string password;    // empty: none
+  bool elsewhere = false;  // the user chose another folder for it, which is not made
+  bool taken = false;      // the name was not free
+  bool noVariant = false;  // skipped because no numbered variant is free
 };
 
 inline constexpr std::string_view kClipboardName = "Clipboard";
@@ -63,8 +63,8 @@ enum class DestinationAnswer : int32_t { Write = 1, Skip = 2 };
 // is to become of a file that has it already. `title` says what the name is for, `picture` is the new picture for previews;
 // both may be missing. `variant` makes numbered variants.
 using VariantMaker = std::function<bool(std::string& path)>;
-DestinationAnswer MakeDestinationName(Destination& destination, const std::string& source, std::string_view title,
-                                      BatchJob& job, const TakenTest& taken, const VariantMaker& variant,
+DestinationAnswer MakeDestinationName(Destination& destination, const std::string& source, std::string_view title, BatchJob& job,
+                                      const TakenTest& taken, const VariantMaker& variant,
                                       const PictureRecord* picture = nullptr);
 
 // Whether a collision has to be shown to somebody.

@@ -15,7 +15,7 @@ class ExternalProgramHost {
   virtual void ShowMessage(std::string_view text) = 0;
   virtual void LeaveClipboardChain() {}  // the window stops watching the clipboard
   virtual void JoinClipboardChain() {}
-  virtual void TakeFocus() {}            // redraws itself and takes the focus back
+  virtual void TakeFocus() {}  // redraws itself and takes the focus back
 };
 
 // Flag: does not wait for the program to end.

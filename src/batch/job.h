@@ -16,20 +16,20 @@ class Prompts;
 
 // What happens to an output whose name is taken. Begins as the settings say; answers of the overwrite prompt change it.
 struct OverwritePolicy {
-  bool prompt = true;     // ask; without it the file that is there is replaced
-  bool keepBoth = true;   // what a prompt is answered with that nobody is shown: a numbered variant
-  bool recycle = false;   // a file that is replaced goes to the recycle bin
-  bool previews = true;   // in the prompt
-  bool skip = false;      // leave out the file, without a question
+  bool prompt = true;    // ask; without it the file that is there is replaced
+  bool keepBoth = true;  // what a prompt is answered with that nobody is shown: a numbered variant
+  bool recycle = false;  // a file that is replaced goes to the recycle bin
+  bool previews = true;  // in the prompt
+  bool skip = false;     // leave out the file, without a question
 };
 OverwritePolicy OverwritePolicyFromSettings();
 
 // How outputs get their names.
 struct NamingRules {
-  int32_t extensionCase = 0;         // ExtensionCaseStyle
-  bool askName = false;              // PromptForDestName
-  bool beside = false;               // DestForceSourceDir: every output lies beside its source
-  bool askPassword = false;          // PasswordProtect
+  int32_t extensionCase = 0;  // ExtensionCaseStyle
+  bool askName = false;       // PromptForDestName
+  bool beside = false;        // DestForceSourceDir: every output lies beside its source
+  bool askPassword = false;   // PasswordProtect
   int32_t firstVariant = 1, lastVariant = INT32_MAX;
 };
 NamingRules NamingRulesFromSettings();
@@ -56,13 +56,13 @@ struct BatchJob {
   bool applyToRest = false;         // the overwrite prompt is not shown and counts as answered with OK
   uint32_t cataloguePage = 0;
   SequentialRenameState rename;
-  bool filesChanged = false;        // a file was renamed or written: browsers have to look again
+  bool filesChanged = false;  // a file was renamed or written: browsers have to look again
 
   OverwritePolicy overwrite = OverwritePolicyFromSettings();
   NamingRules naming = NamingRulesFromSettings();
   ProgressModel progress;
-  uint32_t writeAborts = 0;         // files left out because no numbered variant was free
-  std::vector<FileUse> uses;        // for the file history, which belongs to the main thread: UpdateFileHistory(job.uses)
+  uint32_t writeAborts = 0;   // files left out because no numbered variant was free
+  std::vector<FileUse> uses;  // for the file history, which belongs to the main thread: UpdateFileHistory(job.uses)
 };
 
 // What became of one file.
@@ -70,10 +70,10 @@ struct FileOutcome {
   std::string source = {};
   std::string destination = {};  // Ok: where its output is, or would be in a dry run. Skipped: the file that is in the way
   Status status = Status::Ok;
-  std::string hint = {};       // a sentence that goes behind the message; empty when there is nothing to add
-  bool skipped = false;        // left out by choice or for want of a name; not a failure
-  bool replaced = false;       // the output took the place of a file
-  std::string note = {};       // a remark that is no failure; empty when there is none
+  std::string hint = {};  // a sentence that goes behind the message; empty when there is nothing to add
+  bool skipped = false;   // left out by choice or for want of a name; not a failure
+  bool replaced = false;  // the output took the place of a file
+  std::string note = {};  // a remark that is no failure; empty when there is none
 };
 
 }  // namespace fotomill

@@ -47,9 +47,9 @@ class OrderedRun {
   std::condition_variable caughtUp_;   // items may be begun again
   std::vector<State> states_;
   std::vector<std::thread> workers_;
-  size_t begun_ = 0;    // items before this one were begun
-  size_t head_ = 0;     // the item that is delivered next
-  size_t working_ = 0;  // workers that have not ended
+  size_t begun_ = 0;                             // items before this one were begun
+  size_t head_ = 0;                              // the item that is delivered next
+  size_t working_ = 0;                           // workers that have not ended
   const std::function<void()>* step_ = nullptr;  // of the head item, while it asks
   bool threaded_ = false;
   bool stopped_ = false;

@@ -22,8 +22,7 @@ bool HasWord(std::string_view list, std::string_view word) {
 
 std::string_view LooksLike(const std::string& fileName, int32_t formatIndex) {
   const Signature signature = IdentifyFile(fileName);
-  const bool asNamed =
-      formatIndex != kNoFormat && HasWord(signature.extensions, FormatRow(formatIndex).extension.view());
+  const bool asNamed = formatIndex != kNoFormat && HasWord(signature.extensions, FormatRow(formatIndex).extension.view());
   return asNamed ? std::string_view() : signature.name;
 }
 

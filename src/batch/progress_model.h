@@ -13,9 +13,9 @@ namespace fotomill {
 
 // What each line of the list carries beside its text.
 struct ProgressItem {
-  int32_t file = -1;            // place of its file in the selection, from 0; -1: a line about the batch
-  Status status = Status::Ok;   // of that file
-  bool skipped = false;         // the file was left out; no failure
+  int32_t file = -1;           // place of its file in the selection, from 0; -1: a line about the batch
+  Status status = Status::Ok;  // of that file
+  bool skipped = false;        // the file was left out; no failure
 };
 
 struct ProgressLine {

@@ -25,11 +25,11 @@ inline constexpr std::string_view kPreviewsText = "Show previews";
 
 // The five check boxes of the overwrite prompt.
 struct OverwriteChecks {
-  bool notify = true;       // PromptBeforeOverwrite
-  bool keepBoth = true;     // OverwriteKeepBoth
-  bool applyToRest = false; // of this batch; ends with it
-  bool recycle = false;     // OverwritePromptRecycle
-  bool previews = true;     // OverwritePromptPreviews
+  bool notify = true;        // PromptBeforeOverwrite
+  bool keepBoth = true;      // OverwriteKeepBoth
+  bool applyToRest = false;  // of this batch; ends with it
+  bool recycle = false;      // OverwritePromptRecycle
+  bool previews = true;      // OverwritePromptPreviews
   bool operator==(const OverwriteChecks&) const = default;
 };
 
@@ -43,14 +43,14 @@ struct OverwriteQuestion {
 };
 
 struct OverwriteAnswer {
-  bool ok = false;         // false: this file is skipped and nothing else is looked at
+  bool ok = false;  // false: this file is skipped and nothing else is looked at
   OverwriteChecks checks;
-  std::string name;        // of the File name field: without folder and extension
-  bool skipRest = false;   // not ok, and so for every collision of this batch
+  std::string name;       // of the File name field: without folder and extension
+  bool skipRest = false;  // not ok, and so for every collision of this batch
 };
 
 struct NameQuestion {
-  std::string title;      // what the name is for; may be empty
+  std::string title;  // what the name is for; may be empty
   std::string source;
   std::string path;       // the name that is offered
   std::string extension;  // of the format, without dot

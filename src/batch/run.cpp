@@ -277,7 +277,8 @@ class Batch {
     if (answer == DestinationAnswer::Write && destination.replace && !destination.asked) {
       if (names_.TakenByRun(destination.path, source)) {
         destination.replace = destination.recycle = false;
-        destination.noVariant = !MakeVariant(destination.path, [&](const std::string& path) { return names_.Taken(path, source); });
+        destination.noVariant =
+            !MakeVariant(destination.path, [&](const std::string& path) { return names_.Taken(path, source); });
       }
       if (destination.noVariant) answer = DestinationAnswer::Skip;
     }

@@ -45,7 +45,7 @@ class RunNames {
   bool MakeVariant(std::string& path, int64_t first, int64_t last, const TakenTest& taken);
 
  private:
-  std::string folder_;  // what relative paths are relative to
+  std::string folder_;                                 // what relative paths are relative to
   std::unordered_map<std::string, uint32_t> sources_;  // how often each is there
   std::unordered_map<std::string, uint32_t> planned_;
   std::unordered_set<std::string> given_;

@@ -16,12 +16,12 @@ namespace fotomill {
 
 // How files are numbered: the SequentialRename... keys.
 struct SequentialRenameRules {
-  uint32_t increment = 1;      // at least 1
+  uint32_t increment = 1;  // at least 1
   uint32_t maxAttempts = 32760;
-  std::string separator;       // between name and number; empty: none
-  bool numberFirst = false;    // the number, then the file's own old name
+  std::string separator;     // between name and number; empty: none
+  bool numberFirst = false;  // the number, then the file's own old name
   bool skipColliding = false;
-  bool update = true;          // the next number goes into SequentialRenameBaseNumber
+  bool update = true;  // the next number goes into SequentialRenameBaseNumber
   bool random = false;
 };
 SequentialRenameRules SequentialRenameRulesFromSettings();

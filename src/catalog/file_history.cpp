@@ -26,14 +26,13 @@ namespace fotomill {
 namespace {
 
 constexpr std::string_view kNames[] = {
-    "View",     "Paint",         "Contact sheet",     "Web gallery", "Annotate", "Print",     "Transform",
-    "Filter",   "Effects",       "Convert",           "Get info",    "Move and copy", "Copy to clipboard", "Crop",
-    "Matt",     "Watermark",     "File time",         "Photo workshop", "Find similar", "Catalog"};
+    "View",      "Paint",          "Contact sheet", "Web gallery",   "Annotate",          "Print", "Transform", "Filter",
+    "Effects",   "Convert",        "Get info",      "Move and copy", "Copy to clipboard", "Crop",  "Matt",      "Watermark",
+    "File time", "Photo workshop", "Find similar",  "Catalog"};
 static_assert(std::size(kNames) == kFileFunctionCount);
 
 constexpr std::string_view kExtension = ".fhdb";
-constexpr std::string_view kPathTag = "\tPATH:", kFunctionTag = "\tFUNCTION:", kAccessedTag = "\tACCESSED:",
-                           kEndTag = "\tEND:";
+constexpr std::string_view kPathTag = "\tPATH:", kFunctionTag = "\tFUNCTION:", kAccessedTag = "\tACCESSED:", kEndTag = "\tEND:";
 constexpr size_t kLongestLine = 4095;  // what is longer goes on as a line of its own
 
 // What is known of an entry. With the thumbnail that belongs to it in the list's window it is one slot.
@@ -49,9 +48,7 @@ constexpr uint64_t kSlotBytes = sizeof(Slot) + sizeof(ThumbnailRecord);
 constexpr uint64_t kGrowth = 128;  // entries
 static_assert(kSlotBytes == 28193 && kGrowth * kSlotBytes == 3608704);
 
-int32_t Clamped(int64_t seconds) {
-  return static_cast<int32_t>(std::clamp<int64_t>(seconds, INT32_MIN, INT32_MAX));
-}
+int32_t Clamped(int64_t seconds) { return static_cast<int32_t>(std::clamp<int64_t>(seconds, INT32_MIN, INT32_MAX)); }
 
 std::string_view PathOf(const Slot& slot) { return {slot.path, strnlen(slot.path, sizeof slot.path - 1)}; }
 
@@ -127,9 +124,8 @@ class HistoryList {
 
   // Where a slot stands in the order, or would stand.
   std::vector<uint32_t>::iterator Place(uint32_t number) {
-    return std::lower_bound(order_.begin(), order_.end(), number, [this](uint32_t a, uint32_t b) {
-      return a != b && StandsBefore(Slots()[a], Slots()[b]);
-    });
+    return std::lower_bound(order_.begin(), order_.end(), number,
+                            [this](uint32_t a, uint32_t b) { return a != b && StandsBefore(Slots()[a], Slots()[b]); });
   }
 
   uint32_t FreeSlot() {
@@ -158,17 +154,17 @@ class HistoryList {
   }
 
   platform::ReservedMemory room_;
-  uint64_t capacity_ = 0;          // entries
-  uint32_t used_ = 0;              // slots that ever held an entry
-  std::vector<uint32_t> order_;    // slots as they stand in the list
-  std::vector<uint32_t> free_;     // slots whose entry is gone
+  uint64_t capacity_ = 0;           // entries
+  uint32_t used_ = 0;               // slots that ever held an entry
+  std::vector<uint32_t> order_;     // slots as they stand in the list
+  std::vector<uint32_t> free_;      // slots whose entry is gone
   std::vector<bool> hasThumbnail_;  // of slots
   std::unordered_map<std::string, uint32_t> slotOf_;
 };
 
 HistoryList list;
 bool outOfMemory = false;  // an entry found no room: the list lacks some
-bool loaded = false;  // the list began with what the file held
+bool loaded = false;       // the list began with what the file held
 
 void LimitList() {
   size_t count = list.Count();
@@ -245,8 +241,8 @@ HistoryUpdate UpdateOf(EditResult result) {
 size_t TakeUses(std::span<const FileUse> uses) {
   size_t recorded = 0;
   for (const FileUse& use : uses) {
-    recorded += use.removed ? RemoveFromFileHistory(use.path)
-                            : RecordFileHistory(use.path, use.function, use.created, use.accessed);
+    recorded +=
+        use.removed ? RemoveFromFileHistory(use.path) : RecordFileHistory(use.path, use.function, use.created, use.accessed);
   }
   return recorded;
 }

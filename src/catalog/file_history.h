@@ -18,8 +18,26 @@ namespace fotomill {
 
 // Numbers in the file, and bits of FileHistoryFunctions.
 enum class FileFunction : int32_t {
-  View = 0, Paint, ContactSheet, WebGallery, Annotate, Print, Transform, Filter, Effects, Convert,
-  GetInfo, MoveAndCopy, CopyToClipboard, Crop, Matt, Watermark, FileTime, PhotoWorkshop, FindSimilar, Catalog,
+  View = 0,
+  Paint,
+  ContactSheet,
+  WebGallery,
+  Annotate,
+  Print,
+  Transform,
+  Filter,
+  Effects,
+  Convert,
+  GetInfo,
+  MoveAndCopy,
+  CopyToClipboard,
+  Crop,
+  Matt,
+  Watermark,
+  FileTime,
+  PhotoWorkshop,
+  FindSimilar,
+  Catalog,
 };
 inline constexpr int32_t kFileFunctionCount = 20;
 inline constexpr int32_t kNoFileFunction = -1;
@@ -38,8 +56,7 @@ bool FitsFileHistory(std::string_view path);
 // Adds an entry, or gives the entry of that path another function and access time, puts the list in order and limits it
 // as the settings say. False when nothing was recorded: the history or that function is switched off, the path is no
 // regular file or does not fit, or there is no memory.
-bool RecordFileHistory(std::string_view path, FileFunction function, int32_t created = kOwnTime,
-                       int32_t accessed = kOwnTime);
+bool RecordFileHistory(std::string_view path, FileFunction function, int32_t created = kOwnTime, int32_t accessed = kOwnTime);
 // Takes the entry of a path out of the list. False when there is none.
 bool RemoveFromFileHistory(std::string_view path);
 
@@ -77,10 +94,10 @@ struct FileUse {
 };
 
 enum class HistoryUpdate {
-  Done,      // loaded, recorded and saved
-  Off,       // switched off: nothing was recorded
-  NotRead,   // the history file cannot be read, or is something else: it was left alone
-  Failed,    // it could not be written, or there is no place for it: it is as it was
+  Done,     // loaded, recorded and saved
+  Off,      // switched off: nothing was recorded
+  NotRead,  // the history file cannot be read, or is something else: it was left alone
+  Failed,   // it could not be written, or there is no place for it: it is as it was
 };
 // Records uses, in order, for good: locks the history file, reads it afresh, so that what other processes recorded stays,
 // records, and replaces the file in one step. `recorded` counts the uses that were. With the history switched off in the

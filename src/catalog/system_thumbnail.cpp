@@ -24,8 +24,7 @@ std::string CachedFile(std::string_view uri) {
   const std::string cache = platform::SpecialFolderPath(platform::SpecialFolder::Cache);
   if (cache.empty()) return {};
   const std::span bytes(reinterpret_cast<const uint8_t*>(uri.data()), uri.size());
-  return platform::JoinFolder(platform::JoinFolder(platform::JoinFolder(cache, "thumbnails"), "large"),
-                              Md5Text(bytes) + ".png");
+  return platform::JoinFolder(platform::JoinFolder(platform::JoinFolder(cache, "thumbnails"), "large"), Md5Text(bytes) + ".png");
 }
 
 // The value of a text chunk with that key.

@@ -120,8 +120,8 @@ bool IsLeftover(const std::string& path) {
   platform::StoreFile file;
   std::array<uint8_t, kDatabaseMagic.size()> magic{};
   if (facts.size == 0) return true;
-  return file.Open(path, platform::StoreFile::Mode::Read) == platform::StoreFile::OpenResult::Done &&
-         file.ReadAt(0, magic) && std::ranges::equal(magic, kDatabaseMagic, {}, {}, [](char c) { return static_cast<uint8_t>(c); });
+  return file.Open(path, platform::StoreFile::Mode::Read) == platform::StoreFile::OpenResult::Done && file.ReadAt(0, magic) &&
+         std::ranges::equal(magic, kDatabaseMagic, {}, {}, [](char c) { return static_cast<uint8_t>(c); });
 }
 
 bool MakeEmptyDatabase(const std::string& path, bool& taken) {
@@ -155,8 +155,8 @@ bool PurgesMissing(const DatabaseKey& key) {
     nearest = std::move(folder);
   }
   const platform::DriveKind kind = platform::VolumeOf(nearest).kind;
-  return kind != platform::DriveKind::Network && kind != platform::DriveKind::Optical &&
-         kind != platform::DriveKind::Removable && VolumeKeyFor(nearest) == key.volume;
+  return kind != platform::DriveKind::Network && kind != platform::DriveKind::Optical && kind != platform::DriveKind::Removable &&
+         VolumeKeyFor(nearest) == key.volume;
 }
 
 std::string ThumbnailDatabasePath(const std::string& folder) {
@@ -429,8 +429,7 @@ ThumbnailDatabase::Compacted ThumbnailDatabase::CompactThumbnailDatabase(bool pu
   return result;
 }
 
-ThumbnailDatabase::Compacted ThumbnailDatabase::CompactLocked(bool purge, ProgressSink* progress,
-                                                              const std::atomic<bool>* stop) {
+ThumbnailDatabase::Compacted ThumbnailDatabase::CompactLocked(bool purge, ProgressSink* progress, const std::atomic<bool>* stop) {
   using platform::StoreFile;
   DatabaseHeader header;
   if (!LockAndCheck(header)) return Compacted::NotRead;

@@ -16,7 +16,7 @@ namespace {
 constexpr std::string_view kMagic = "FMTDBIX1";
 constexpr size_t kHeadSize = 48, kBlockSize = 512, kCellSize = 8;
 constexpr size_t kCellsInBlock = kBlockSize / kCellSize - 1, kCellsUsed = 40;  // on an average; what is free ends a search
-constexpr size_t kSmallestTable = 1024;  // cells
+constexpr size_t kSmallestTable = 1024;                                        // cells
 constexpr uint64_t kFactor = 0x9E3779B97F4A7C15;
 
 uint64_t WordAt(const uint8_t* bytes) {
@@ -81,8 +81,7 @@ Cell CellAt(const uint8_t* block, size_t place) {
 bool OpenForSaving(const std::string& path, platform::StoreFile& file) {
   using platform::StoreFile;
   const StoreFile::OpenResult result = file.Open(path, StoreFile::Mode::ReadWrite);
-  if (result == StoreFile::OpenResult::Missing)
-    return file.Open(path, StoreFile::Mode::CreateNew) == StoreFile::OpenResult::Done;
+  if (result == StoreFile::OpenResult::Missing) return file.Open(path, StoreFile::Mode::CreateNew) == StoreFile::OpenResult::Done;
   std::vector<uint8_t> magic(kMagic.size());
   return result == StoreFile::OpenResult::Done &&
          (file.Size() == 0 || (file.ReadAt(0, magic) && ByteReader(magic).Match(kMagic)));

@@ -27,21 +27,17 @@ bool ReadSmall(const std::string& picturePath, const ThumbnailSources& sources, 
   const bool usesFile = sources.mode == choice::kDiskBased || settings.AlwaysUseTHN != 0;
   if (usesFile && ReadThumbnailFile(record, ThumbnailPathFor(picturePath))) return true;
   switch (sources.mode) {
-    case choice::kDiskBased:
-      return false;
-    case choice::kVirtual:
-      return ReadListed(picturePath, sources, record);
+    case choice::kDiskBased: return false;
+    case choice::kVirtual: return ReadListed(picturePath, sources, record);
     case choice::kGlobalDatabase:
-    case choice::kLocalDatabase:
-      break;
+    case choice::kLocalDatabase: break;
   }
   return sources.database != nullptr && sources.database->Find(picturePath, VolumeKeyFor(picturePath), record);
 }
 
 }  // namespace
 
-bool LookUpThumbnail(const std::string& picturePath, bool large, const ThumbnailSources& sources,
-                     AnyThumbnailRecord& record) {
+bool LookUpThumbnail(const std::string& picturePath, bool large, const ThumbnailSources& sources, AnyThumbnailRecord& record) {
   const bool fromSystem =
       large && sources.mode == choice::kDiskBased && sources.systemCache && settings.UseWindowsThumbnailCache != 0;
   if (fromSystem && ReadFromSystem(picturePath, record)) return true;

@@ -41,8 +41,8 @@ double ReachOf(int32_t pictureEdge, int32_t imageEdge, int32_t reduction) {
 Status ScaleToFit(const PictureRecord& picture, ScaledPicture& scaled) {
   const int32_t width = picture.image.Width(), height = picture.image.Height();
   const bool reduced = picture.width > width || picture.height > height;
-  const Size size = reduced ? FitSize(picture.width, picture.height, kSmallThumbnailSide)
-                            : FitSize(width, height, kSmallThumbnailSide);
+  const Size size =
+      reduced ? FitSize(picture.width, picture.height, kSmallThumbnailSide) : FitSize(width, height, kSmallThumbnailSide);
   const Reach reach{ReachOf(picture.width, width, picture.reduction), ReachOf(picture.height, height, picture.reduction)};
   return ScaleFiltered(picture.image, picture.alpha, reach, size, ScaleFilter::Lanczos, scaled.image, scaled.alpha);
 }
@@ -116,8 +116,7 @@ bool MakeThumbnailRecord(ThumbnailRecord& record, const PictureRecord& picture) 
   ScaledPicture scaled;
   if (picture.image.Empty()) return false;
   const Status status = settings.ThumbnailQuickResize != 0 ? ScaleQuickly(picture, scaled) : ScaleToFit(picture, scaled);
-  return status == Status::Ok &&
-         PlaceInSquare(scaled, static_cast<Color>(settings.ThumbnailMatte), Blend, record) == Status::Ok;
+  return status == Status::Ok && PlaceInSquare(scaled, static_cast<Color>(settings.ThumbnailMatte), Blend, record) == Status::Ok;
 }
 
 bool MakeBlendedThumbnailRecord(ThumbnailRecord& record, const PictureRecord& picture, Color background) {
@@ -136,8 +135,6 @@ bool MakeLargeThumbnailRecord(LargeThumbnailRecord& record, const PictureRecord&
 }
 
 Status ThumbnailRecordToBitmap(const ThumbnailRecord& record, PackedImage& bitmap) { return ToBitmap(record, bitmap); }
-Status ThumbnailRecordToBitmap(const LargeThumbnailRecord& record, PackedImage& bitmap) {
-  return ToBitmap(record, bitmap);
-}
+Status ThumbnailRecordToBitmap(const LargeThumbnailRecord& record, PackedImage& bitmap) { return ToBitmap(record, bitmap); }
 
 }  // namespace fotomill

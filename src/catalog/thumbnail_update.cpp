@@ -16,8 +16,7 @@ const ThumbnailUpdateChoice kThumbnailUpdateChoices[4] = {
     {kUpdateCreate, "&Create thumbnails now. This may take a few seconds."},
     {kUpdateLater, "&Don't create thumbnails now, but display this prompt in the future."},
     {kUpdateNotHere, "D&on't create thumbnails now and don't display this prompt again for this browser."},
-    {kUpdateNever,
-     "Do&n't create thumbnails now and never display this prompt again. This option can be reversed in Setup."},
+    {kUpdateNever, "Do&n't create thumbnails now and never display this prompt again. This option can be reversed in Setup."},
 };
 
 namespace {

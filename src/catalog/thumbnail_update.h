@@ -17,9 +17,9 @@ struct ThumbnailBrowser {
   std::vector<std::string> files;  // names in its list, all files of the folder that it shows, without folders and drives
   choice::ThumbnailMode mode = choice::kDiskBased;
   choice::ViewMode view = choice::kViewNormal;
-  bool asks = true;             // false once its user wants no more offers here
-  bool compacts = true;         // removes orphans
-  int64_t lastCompaction = 0;   // seconds since 1970 UTC
+  bool asks = true;            // false once its user wants no more offers here
+  bool compacts = true;        // removes orphans
+  int64_t lastCompaction = 0;  // seconds since 1970 UTC
 };
 
 // Values of UpdateThumbnailsOptions and the texts of the box "Update Thumbnails", which shows ThumbnailUpdateQuestion,

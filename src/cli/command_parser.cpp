@@ -45,8 +45,7 @@ class HelpFormatter : public CLI::Formatter {
 void AddGlobalOptions(CLI::App& app, GlobalOptions& global) {
   app.option_defaults()->group(kGlobalGroup);
   AddName(app, "--data", global.dataFolder, "DIR", "Folder of the configuration and the stores");
-  AddRepeatedText(app, "--set", global.settings, "KEY=VALUE",
-                  "Give a configuration key a value for this run; may be repeated");
+  AddRepeatedText(app, "--set", global.settings, "KEY=VALUE", "Give a configuration key a value for this run; may be repeated");
   AddFlag(app, "-q,--quiet", global.quiet, "No progress and no closing lines");
   AddFlag(app, "--no-input", global.noInput, "Never ask");
   AddFlag(app, "--no-plugins", global.noPlugins, "Load no plug-ins");
@@ -97,9 +96,7 @@ void CommandParser::ParseArguments(std::vector<std::string> arguments) {
   TakeNames();
 }
 
-std::string CommandParser::HelpPage() const {
-  return CLI::detail::find_and_replace(help(), "\n\n\n", "\n\n");
-}
+std::string CommandParser::HelpPage() const { return CLI::detail::find_and_replace(help(), "\n\n\n", "\n\n"); }
 
 // What the parser did not know is a name, or an option that there is not.
 void CommandParser::TakeNames() {
@@ -116,8 +113,7 @@ void CommandParser::TakeNames() {
   }
   if (names.values.size() < names.least) throw CLI::RequiredError(names.placeholder);
   if (names.values.size() > names.most) {
-    throw CLI::ExtrasError("\"" + names.values[names.most] + "\" is one argument too many",
-                           CLI::ExitCodes::ExtrasError);
+    throw CLI::ExtrasError("\"" + names.values[names.most] + "\" is one argument too many", CLI::ExitCodes::ExtrasError);
   }
 }
 
@@ -128,8 +124,7 @@ void CommandParser::RefuseOption(const std::string& typed) const {
     for (const std::string& longName : option->get_lnames()) known.push_back("--" + longName);
   }
   const std::vector<std::string_view> names(known.begin(), known.end());
-  throw CLI::ExtrasError("There is no option \"" + name + "\"." + NearestNameHint(name, names),
-                         CLI::ExitCodes::ExtrasError);
+  throw CLI::ExtrasError("There is no option \"" + name + "\"." + NearestNameHint(name, names), CLI::ExitCodes::ExtrasError);
 }
 
 }  // namespace fotomill::cli

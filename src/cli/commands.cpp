@@ -55,9 +55,7 @@ constexpr Command kCommands[] = {
 
 }  // namespace
 
-std::span<const Command> Commands() {
-  return kCommands;
-}
+std::span<const Command> Commands() { return kCommands; }
 
 const Command* FindCommand(std::string_view name) {
   for (const Command& command : kCommands) {

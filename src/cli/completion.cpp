@@ -172,8 +172,8 @@ std::string FishScript(const std::vector<CommandWords>& commands) {
     script += "complete -c fotomill -n __fotomill_none -f -a " + first + " -d " +
               FishQuoted(blank == std::string::npos ? command.summary : first + " ...") + "\n";
     if (blank != std::string::npos) {
-      script += "complete -c fotomill -n '__fotomill_is " + first + "' -f -a " + command.name.substr(blank + 1) +
-                " -d " + FishQuoted(command.summary) + "\n";
+      script += "complete -c fotomill -n '__fotomill_is " + first + "' -f -a " + command.name.substr(blank + 1) + " -d " +
+                FishQuoted(command.summary) + "\n";
     }
     CommandContext context;
     script += FishOptions("__fotomill_is " + command.name, CommandParser(FindCommand(command.name), context));

@@ -127,8 +127,7 @@ int RunSet(const ConfigOptions& options, const CommandContext& context) {
   const std::string& name = context.names.values[0];
   const KeyRow* const row = FindKey(name);
   if (row == nullptr) {
-    return UsageError(context,
-                      "There is no key \"" + name + "\"; the nearest is " + std::string(NearestKey(name)) + ".");
+    return UsageError(context, "There is no key \"" + name + "\"; the nearest is " + std::string(NearestKey(name)) + ".");
   }
   const SettingValue value = ReadValue(*row, context.names.values[1], ValueSource::Person);
   if (!value.usable) return UsageError(context, FaultMessage(*row, value.fault));
@@ -161,8 +160,7 @@ int RunPath(const ConfigOptions& options, const CommandContext& context) {
 
 using Run = int (*)(const ConfigOptions& options, const CommandContext& context);
 
-std::shared_ptr<ConfigOptions> SetUp(CLI::App& app, CommandContext& context, Run run, const char* jsonHelp,
-                                     const char* example) {
+std::shared_ptr<ConfigOptions> SetUp(CLI::App& app, CommandContext& context, Run run, const char* jsonHelp, const char* example) {
   auto options = std::make_shared<ConfigOptions>();
   AddFlag(app, "--json", options->json, jsonHelp);
   SetFooter(app, std::string("Example: ") + example);

@@ -76,9 +76,8 @@ std::string CheckOptions(const ConvertOptions& options, const CommandContext& co
   if (options.to.empty() && options.out.empty()) return "Say with --to which format to convert to.";
   const std::string extension = options.to.empty() ? std::string(platform::ExtensionOf(options.out)) : options.to;
   if (const std::string wrong = ReadDestinationFormat(extension, job); !wrong.empty()) {
-    return job.formatIndex != kNoFormat || !options.to.empty()
-               ? wrong
-               : "\"" + options.out + "\" selects no format; name one with --to.";
+    return job.formatIndex != kNoFormat || !options.to.empty() ? wrong
+                                                               : "\"" + options.out + "\" selects no format; name one with --to.";
   }
   if (options.prefix.size() > kLongestPrefix) {
     return "The prefix is longer than " + std::to_string(kLongestPrefix) + " characters.";
@@ -129,14 +128,12 @@ void SetUpConvert(CLI::App& app, CommandContext& context) {
             "ask (the way on a terminal), replace, keep-both (elsewhere) or skip files of an output's name");
   AddFlag(app, "--keep-tree", options->keepTree, "Rebuild the folders of named folders in --dest");
   AddFlag(app, "--keep-times", options->keepTimes, "Give outputs the times of their sources");
-  AddChoice(app, "--metadata", options->metadata, "HOW", {"keep", "strip"},
-            "Keep or strip EXIF, XMP and colour profiles");
+  AddChoice(app, "--metadata", options->metadata, "HOW", {"keep", "strip"}, "Keep or strip EXIF, XMP and colour profiles");
   AddFlag(app, "--auto-orient", options->autoOrient, "Turn pictures upright as their EXIF says");
   AddFlag(app, "--reduce", options->reduce, "Reduce the colours of pictures that are too deep for the format");
   AddNumber(app, "--quality", options->quality, "N", 1, 100, "Of JPEG and WebP, 1 to 100");
   AddNumber(app, "--page", options->page, "N", 1, INT32_MAX, "Page to take of files with several, from 1");
-  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, INT32_MAX,
-            "Pictures at work at a time; 0, the default, is one a core");
+  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, INT32_MAX, "Pictures at work at a time; 0, the default, is one a core");
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would be done");
   AddFlag(app, "-v,--verbose", options->verbose, "Say when a format cannot hold a picture's metadata");
   AddFlag(app, "--json", options->json, "One JSON array of {file, destination, status, message}");

@@ -40,20 +40,14 @@ void TellConfiguration(ResultOutput& output) {
   std::string state;
   switch (StateOfConfiguration()) {
     case ConfigurationState::NotLoaded:
-    case ConfigurationState::Missing:
-      state = " (not there: the defaults are in force)";
-      break;
-    case ConfigurationState::Unreadable:
-      state = " (cannot be read: the defaults are in force, and nothing will be saved)";
-      break;
-    case ConfigurationState::Loaded:
-      break;
+    case ConfigurationState::Missing: state = " (not there: the defaults are in force)"; break;
+    case ConfigurationState::Unreadable: state = " (cannot be read: the defaults are in force, and nothing will be saved)"; break;
+    case ConfigurationState::Loaded: break;
   }
   Tell(output, "Configuration", ConfigurationPath() + state);
   for (const ValueComplaint& complaint : ConfigurationComplaints()) {
     Tell(output, "  line " + std::to_string(complaint.line),
-         std::string(complaint.row->name) + "=" + complaint.value + ": " +
-             FaultMessage(*complaint.row, complaint.fault));
+         std::string(complaint.row->name) + "=" + complaint.value + ": " + FaultMessage(*complaint.row, complaint.fault));
   }
 }
 
@@ -76,8 +70,7 @@ void TellPlugins(ResultOutput& output, bool wanted) {
     list += (list.empty() ? "" : " ") + UpperCase(PluginRow(i).extension);
   }
   for (const auto& [path, list] : formats) Tell(output, "  " + EscapeControls(platform::FileNameOf(path)), list);
-  for (const platform::FolderEntry& entry :
-       platform::ListFolder(folder).value_or(std::vector<platform::FolderEntry>())) {
+  for (const platform::FolderEntry& entry : platform::ListFolder(folder).value_or(std::vector<platform::FolderEntry>())) {
     const bool module = UpperCase(entry.name).starts_with("FMWPL") && entry.name.ends_with(platform::kModuleExtension);
     if (module && !IsRegistered(platform::JoinFolder(folder, entry.name))) {
       Tell(output, "  " + EscapeControls(entry.name), "not used: no module of this system, or it refuses to work here");
@@ -99,8 +92,7 @@ void TellFormats(ResultOutput& output) {
   }
   Tell(output, "Formats", std::to_string(readable) + " can be read, " + std::to_string(writable) + " written");
   if (!off.empty()) output.Line("  Switched off:" + off);
-  for (const auto& [reason, extensions] : reasons)
-    output.Line("  " + reason.substr(0, reason.size() - 1) + ":" + extensions);
+  for (const auto& [reason, extensions] : reasons) output.Line("  " + reason.substr(0, reason.size() - 1) + ":" + extensions);
 }
 
 int RunDoctor(const CommandContext& context) {

@@ -66,12 +66,9 @@ Outcome WriteThumbnail(std::span<const uint8_t> bytes, const ExifOptions& option
   if (!file.Create(path)) return {Status::ErrorCreatingFile, {}, path};
   if (!file.Write(bytes)) return {Status::ErrorWritingFile, {}, path};
   switch (file.Commit(replace ? platform::Existing::Replace : platform::Existing::Refuse)) {
-    case platform::CommitResult::Done:
-      return {};
-    case platform::CommitResult::Taken:
-      return {Status::ErrorCreatingFile, taken, path};
-    case platform::CommitResult::Failed:
-      break;
+    case platform::CommitResult::Done: return {};
+    case platform::CommitResult::Taken: return {Status::ErrorCreatingFile, taken, path};
+    case platform::CommitResult::Failed: break;
   }
   return {Status::ErrorWritingFile, {}, path};
 }
@@ -96,8 +93,7 @@ Outcome WalkFile(const SelectedFile& file, const ExifOptions& options, ExifSink&
 
 class ExifRun {
  public:
-  ExifRun(const ExifOptions& options, const CommandContext& context)
-      : options_(options), output_(context, options.json) {}
+  ExifRun(const ExifOptions& options, const CommandContext& context) : options_(options), output_(context, options.json) {}
 
   void ReportFiles(const std::vector<SelectedFile>& files) {
     for (const SelectedFile& file : files) {

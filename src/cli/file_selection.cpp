@@ -97,8 +97,7 @@ class Selector {
 void AddSelection(CLI::App& app, SelectionOptions& options, CommandContext& context) {
   context.names.Declare("FILE...", "Pictures, and folders whose pictures are meant", 0);
   AddFlag(app, "-r,--recursive", options.recursive, "Take the folders in named folders as well");
-  AddName(app, "--files-from", options.filesFrom, "FILE|-",
-          "Take names from a file, one a line; - is the standard input");
+  AddName(app, "--files-from", options.filesFrom, "FILE|-", "Take names from a file, one a line; - is the standard input");
   AddFlag(app, "-0,--null", options.zeroTerminated, "Names in that file end in a zero byte instead");
 }
 

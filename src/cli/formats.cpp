@@ -40,8 +40,8 @@ Json RowAsJson(int32_t index) {
 std::string RowAsText(int32_t index) {
   const FormatEntry& row = FormatRow(index);
   char front[48];
-  std::snprintf(front, sizeof front, "%2d  %-6.6s  %-5s %-5s  ", index, row.extension.c_str(),
-                CanRead(row) ? "read" : "", CanWrite(row) ? "write" : "");
+  std::snprintf(front, sizeof front, "%2d  %-6.6s  %-5s %-5s  ", index, row.extension.c_str(), CanRead(row) ? "read" : "",
+                CanWrite(row) ? "write" : "");
   std::string line = EscapeControls(front) + EscapeControls(row.description);
   if (row.enabled == 0) line += " (switched off)";
   return line;
@@ -49,8 +49,7 @@ std::string RowAsText(int32_t index) {
 
 std::string PluginAsText(const PluginFormatFacts& format) {
   char front[48];
-  std::snprintf(front, sizeof front, "    %-6.6s  read  %-5s  ", format.extension.c_str(),
-                format.canWrite ? "write" : "");
+  std::snprintf(front, sizeof front, "    %-6.6s  read  %-5s  ", format.extension.c_str(), format.canWrite ? "write" : "");
   return EscapeControls(front) + EscapeControls(PluginDescription(format));
 }
 
@@ -86,9 +85,7 @@ void SetUpFormats(CLI::App& app, CommandContext& context) {
   Exclude(destinations, json);
   Exclude(destinations, filter);
   Exclude(filter, json);
-  SetFooter(
-      app,
-      "Without an option: row, extension, what this build can do, description.\n\nExample: fotomill formats --json");
+  SetFooter(app, "Without an option: row, extension, what this build can do, description.\n\nExample: fotomill formats --json");
   context.run = [options, &context] { return RunFormats(*options, context); };
 }
 

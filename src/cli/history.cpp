@@ -40,8 +40,8 @@ int Complain(const CommandContext& context, std::string_view message) {
 std::string TimeText(int64_t seconds) {
   const platform::LocalTime time = platform::LocalTimeOf(seconds);
   char text[40];
-  std::snprintf(text, sizeof text, "%04d-%02d-%02d %02d:%02d:%02d", time.year, time.month, time.day, time.hour,
-                time.minute, time.second);
+  std::snprintf(text, sizeof text, "%04d-%02d-%02d %02d:%02d:%02d", time.year, time.month, time.day, time.hour, time.minute,
+                time.second);
   return text;
 }
 
@@ -89,8 +89,7 @@ int RunAdd(const HistoryOptions& options, const CommandContext& context) {
   if (function == kNoFileFunction) return UsageError(context, UnknownFunction(options.function));
   ResultOutput output(context, options.json);
   const std::string& name = context.names.values[0];
-  const FileUse use{platform::AbsolutePath(name), static_cast<FileFunction>(function), options.created,
-                    options.accessed, false};
+  const FileUse use{platform::AbsolutePath(name), static_cast<FileFunction>(function), options.created, options.accessed, false};
   Status status = Status::Ok;
   std::string hint;
   if (!platform::IsRegularFile(use.path)) {
@@ -110,15 +109,10 @@ int RunAdd(const HistoryOptions& options, const CommandContext& context) {
   }
   size_t recorded = 0;
   switch (UpdateFileHistory({&use, 1}, &recorded)) {
-    case HistoryUpdate::Off:
-      output.Note("The file history is switched off.");
-      return kExitOk;
-    case HistoryUpdate::NotRead:
-      return Complain(context, kNotRead);
-    case HistoryUpdate::Failed:
-      return Complain(context, kNotWritten);
-    case HistoryUpdate::Done:
-      break;
+    case HistoryUpdate::Off: output.Note("The file history is switched off."); return kExitOk;
+    case HistoryUpdate::NotRead: return Complain(context, kNotRead);
+    case HistoryUpdate::Failed: return Complain(context, kNotWritten);
+    case HistoryUpdate::Done: break;
   }
   if (recorded == 0) output.Note(line + "not recorded, FileHistoryFunctions leaves this function out.");
   return kExitOk;

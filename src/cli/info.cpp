@@ -3,9 +3,9 @@
 #include <memory>
 #include <string>
 
+#include "batch/picture_failure.h"
 #include "cli/file_selection.h"
 #include "cli/options.h"
-#include "batch/picture_failure.h"
 #include "cli/result_output.h"
 #include "cli/used_files.h"
 #include "core/shown_text.h"

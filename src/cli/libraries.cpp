@@ -20,8 +20,7 @@ namespace {
 
 #define FOTOMILL_QUOTED(text) #text
 #define FOTOMILL_QUOTED_VALUE(macro) FOTOMILL_QUOTED(macro)
-#define FOTOMILL_VERSION_OF(major, minor, patch) \
-  FOTOMILL_QUOTED(major) "." FOTOMILL_QUOTED(minor) "." FOTOMILL_QUOTED(patch)
+#define FOTOMILL_VERSION_OF(major, minor, patch) FOTOMILL_QUOTED(major) "." FOTOMILL_QUOTED(minor) "." FOTOMILL_QUOTED(patch)
 
 // "LIBTIFF, Version 4.5.0" and a copyright line.
 std::string TiffVersion() {

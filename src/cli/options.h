@@ -28,11 +28,11 @@ CLI::Option* AddName(CLI::App& app, const char* names, std::string& value, const
 CLI::Option* AddChoice(CLI::App& app, const char* names, std::string& value, const char* shownAs,
                        std::initializer_list<const char*> choices, const char* help);
 // A number from `least` to `most`.
-CLI::Option* AddNumber(CLI::App& app, const char* names, int32_t& value, const char* shownAs, int32_t least,
-                       int32_t most, const char* help);
+CLI::Option* AddNumber(CLI::App& app, const char* names, int32_t& value, const char* shownAs, int32_t least, int32_t most,
+                       const char* help);
 // `count` texts behind the option.
-CLI::Option* AddTexts(CLI::App& app, const char* names, std::vector<std::string>& values, int count,
-                      const char* shownAs, const char* help);
+CLI::Option* AddTexts(CLI::App& app, const char* names, std::vector<std::string>& values, int count, const char* shownAs,
+                      const char* help);
 // A text each time the option is given.
 CLI::Option* AddRepeatedText(CLI::App& app, const char* names, std::vector<std::string>& values, const char* shownAs,
                              const char* help);

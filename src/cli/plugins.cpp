@@ -48,8 +48,7 @@ int RunPlugins(const PluginsOptions& options, const CommandContext& context) {
 
 void SetUpPlugins(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<PluginsOptions>();
-  AddFlag(app, "--json", options->json,
-          "One JSON array: {path, extension, textA, textB, flags1, flags2, canRead, canWrite}");
+  AddFlag(app, "--json", options->json, "One JSON array: {path, extension, textA, textB, flags1, flags2, canRead, canWrite}");
   SetFooter(app, "Modules lie in the folder \"plugin\" beside the program.\nExample: fotomill plugins --json");
   context.run = [options, &context] { return RunPlugins(*options, context); };
 }

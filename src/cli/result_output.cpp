@@ -10,9 +10,7 @@ namespace {
 
 constexpr std::string_view kRed = "\x1b[31m", kPlain = "\x1b[0m";
 
-void Write(std::FILE* stream, std::string_view text) {
-  std::fwrite(text.data(), 1, text.size(), stream);
-}
+void Write(std::FILE* stream, std::string_view text) { std::fwrite(text.data(), 1, text.size(), stream); }
 
 // JSON text in which control characters beyond ASCII, which JSON lets stand, are escaped too: it may go to a terminal.
 std::string SafeJson(const Json& value) {
@@ -57,9 +55,7 @@ ResultOutput::ResultOutput(const CommandContext& context, bool json)
   if (json_) Write(context_.io.out, "[");
 }
 
-ResultOutput::~ResultOutput() {
-  EndArray();
-}
+ResultOutput::~ResultOutput() { EndArray(); }
 
 std::string ResultOutput::Shown(std::string_view name) const {
   return context_.io.outTerminal ? EscapeControls(name) : std::string(name);
@@ -119,9 +115,7 @@ void ResultOutput::Note(std::string_view text) {
   if (!context_.global.quiet) Message(text);
 }
 
-bool ResultOutput::GoesOn() const {
-  return std::ferror(context_.io.out) == 0 && platform::PendingExit() == 0;
-}
+bool ResultOutput::GoesOn() const { return std::ferror(context_.io.out) == 0 && platform::PendingExit() == 0; }
 
 int ResultOutput::Finish() {
   progress_.Clear();

@@ -19,9 +19,7 @@ namespace {
 
 using Arguments = std::vector<std::string>;
 
-void Print(std::FILE* stream, std::string_view text) {
-  std::fwrite(text.data(), 1, text.size(), stream);
-}
+void Print(std::FILE* stream, std::string_view text) { std::fwrite(text.data(), 1, text.size(), stream); }
 
 int Complain(const Io& io, const std::string& message, const std::string& topic = {}) {
   Print(io.err, "fotomill: " + (io.errTerminal ? EscapeControls(message) : message) + "\nTry \"fotomill help" +

@@ -6,11 +6,11 @@
 #include <vector>
 
 #include "batch/ordered_run.h"
+#include "batch/picture_failure.h"
 #include "catalog/thumbnail_database.h"
 #include "catalog/thumbnail_file.h"
 #include "cli/file_selection.h"
 #include "cli/options.h"
-#include "batch/picture_failure.h"
 #include "cli/result_output.h"
 #include "cli/used_files.h"
 #include "platform/files.h"
@@ -253,7 +253,9 @@ int RunDelete(const TdbOptions& options, CommandContext& context) {
 class CompactionProgress : public ProgressSink {
  public:
   explicit CompactionProgress(ResultOutput& output) : output_(output) {}
-  void Step(int32_t done, int32_t total) override { output_.ShowProgress(static_cast<uint64_t>(done), static_cast<uint64_t>(total)); }
+  void Step(int32_t done, int32_t total) override {
+    output_.ShowProgress(static_cast<uint64_t>(done), static_cast<uint64_t>(total));
+  }
 
  private:
   ResultOutput& output_;

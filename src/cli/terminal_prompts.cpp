@@ -20,10 +20,10 @@ std::string Trimmed(std::string_view line) {
 
 // What a letter says about a file whose name is taken.
 struct Choice {
-  char letter;    // its capital means: and so for all that follow
-  bool ok;        // false: the file is left out
+  char letter;  // its capital means: and so for all that follow
+  bool ok;      // false: the file is left out
   bool keepBoth;
-  bool recycle;   // the file that is there
+  bool recycle;  // the file that is there
 };
 constexpr Choice kChoices[] = {
     {'r', true, false, false},

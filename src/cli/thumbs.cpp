@@ -9,10 +9,10 @@
 #include <vector>
 
 #include "batch/ordered_run.h"
+#include "batch/picture_failure.h"
 #include "catalog/thumbnail_file.h"
 #include "cli/file_selection.h"
 #include "cli/options.h"
-#include "batch/picture_failure.h"
 #include "cli/result_output.h"
 #include "cli/used_files.h"
 #include "core/settings.h"

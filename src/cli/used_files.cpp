@@ -15,8 +15,8 @@ void UsedFiles::Add(const std::string& name) {
     folder_ = folder;
     absoluteFolder_ = platform::AbsolutePath(folder.empty() ? "." : folder);
   }
-  uses_.push_back({platform::JoinFolder(absoluteFolder_, fileName), *function_, kOwnTime,
-                   static_cast<int32_t>(platform::Now()), false});
+  uses_.push_back(
+      {platform::JoinFolder(absoluteFolder_, fileName), *function_, kOwnTime, static_cast<int32_t>(platform::Now()), false});
 }
 
 }  // namespace fotomill::cli

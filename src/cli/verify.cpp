@@ -3,9 +3,9 @@
 #include <memory>
 #include <string>
 
+#include "batch/picture_failure.h"
 #include "cli/file_selection.h"
 #include "cli/options.h"
-#include "batch/picture_failure.h"
 #include "cli/result_output.h"
 #include "cli/used_files.h"
 #include "picture/registry.h"
@@ -69,8 +69,7 @@ void SetUpVerify(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<VerifyOptions>();
   AddSelection(app, options->selection, context);
   AddFlag(app, "--json", options->json, "One JSON array of {file, status, message}");
-  SetFooter(app,
-            "Every page of every file is decoded in full; nothing is written.\n\nExample: fotomill verify -r holiday");
+  SetFooter(app, "Every page of every file is decoded in full; nothing is written.\n\nExample: fotomill verify -r holiday");
   context.run = [options, &context] { return RunVerify(*options, context); };
 }
 

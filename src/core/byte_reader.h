@@ -39,9 +39,7 @@ class ByteReader {
     return view;
   }
   // The next bytes without consuming them, as many as are left but at most `count`.
-  std::span<const uint8_t> Peek(uint64_t count) const {
-    return bytes_.subspan(position_, count < Left() ? count : Left());
-  }
+  std::span<const uint8_t> Peek(uint64_t count) const { return bytes_.subspan(position_, count < Left() ? count : Left()); }
   void Skip(uint64_t count) { (void)Take(count); }
   // Moves to an offset from the start; beyond the end the reader is short.
   void Seek(uint64_t offset) {

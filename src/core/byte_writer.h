@@ -73,8 +73,8 @@ class ByteWriter {
     Patch(offset, bytes);
   }
   void PatchLe32(uint64_t offset, uint32_t value) {
-    const uint8_t bytes[] = {static_cast<uint8_t>(value), static_cast<uint8_t>(value >> 8),
-                             static_cast<uint8_t>(value >> 16), static_cast<uint8_t>(value >> 24)};
+    const uint8_t bytes[] = {static_cast<uint8_t>(value), static_cast<uint8_t>(value >> 8), static_cast<uint8_t>(value >> 16),
+                             static_cast<uint8_t>(value >> 24)};
     Patch(offset, bytes);
   }
   bool Failed() const { return failed_; }

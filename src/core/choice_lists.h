@@ -14,7 +14,12 @@ enum JpegSubsampling : int32_t { kSubsample444 = 0, kSubsample422 = 1, kSubsampl
 enum JpegEngine : int32_t { kJpegStandard = 0, kJpegFastest = 1 };
 // TiffOptions: compression of the strips. CCITT (group 4) serves pictures of one bit; deeper ones get LZW instead.
 enum TiffCompression : int32_t {
-  kTiffNone = 0, kTiffPackBits = 1, kTiffCcitt = 2, kTiffDeflate = 3, kTiffLzw = 4, kTiffJpeg = 5,
+  kTiffNone = 0,
+  kTiffPackBits = 1,
+  kTiffCcitt = 2,
+  kTiffDeflate = 3,
+  kTiffLzw = 4,
+  kTiffJpeg = 5,
 };
 // ICOCompression: which entries of an icon are PNG files instead of bitmaps.
 enum IconCompression : int32_t { kIconBitmaps = 0, kIconPng256 = 1, kIconPngAlways = 2 };
@@ -39,7 +44,12 @@ enum ThumbnailMode : int32_t { kDiskBased = 0, kVirtual = 1, kGlobalDatabase = 2
 enum ViewMode : int32_t { kViewList = 0, kViewDetails = 1, kViewSmall = 2, kViewNormal = 3, kViewLarge = 4 };
 // DefaultSortMode and a folder's SortMode.
 enum SortMode : int32_t {
-  kSortName = 0, kSortType = 1, kSortSize = 2, kSortDate = 3, kSortExifDate = 4, kSortDimensions = 5,
+  kSortName = 0,
+  kSortType = 1,
+  kSortSize = 2,
+  kSortDate = 3,
+  kSortExifDate = 4,
+  kSortDimensions = 5,
 };
 // DefaultViewZoom, by value: 1 to 12 are the percentages of the list.
 enum ViewZoom : int32_t { kZoomActualSize = 7, kZoomFit = 13, kZoomFitWidth = 14, kZoomFill = 15 };
@@ -53,7 +63,13 @@ enum HistoryLimit : int32_t { kLimitCount = 0, kLimitDays = 1 };
 enum HistoryThumbnails : int32_t { kHistoryNoThumbnails = 0, kHistorySmall = 1, kHistoryLarge = 2 };
 // FileHistorySortMode: a column of the history window.
 enum HistoryColumn : int32_t {
-  kColumnName = 0, kColumnType = 1, kColumnFunction = 2, kColumnCreated = 3, kColumnAccessed = 4, kColumnSize = 5, kColumnPath = 6,
+  kColumnName = 0,
+  kColumnType = 1,
+  kColumnFunction = 2,
+  kColumnCreated = 3,
+  kColumnAccessed = 4,
+  kColumnSize = 5,
+  kColumnPath = 6,
 };
 // ExifDistinceUnits.
 enum DistanceUnit : int32_t { kMiles = 0, kKilometres = 1 };

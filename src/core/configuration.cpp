@@ -18,7 +18,7 @@ constexpr std::string_view kBlockHeader = ";\r\n;\r\n;------ INI FILE ------\r\n
 
 struct Configuration {
   ConfigurationState state = ConfigurationState::NotLoaded;
-  std::string text;                    // of the file as this run knows it: as loaded, with this run's own changes
+  std::string text;  // of the file as this run knows it: as loaded, with this run's own changes
   std::vector<ValueComplaint> complaints;
   std::bitset<kKeyCount> forThisRun;  // keys whose value came from SetSetting
 };
@@ -48,8 +48,7 @@ void TakeValues(Configuration& configuration) {
     const SettingValue value = ReadValue(row, entry.value, ValueSource::File);
     if (value.usable) StoreValue(row, value);
     if (value.fault == ValueFault::None || value.fault == ValueFault::Internal) return;
-    configuration.complaints.push_back(
-        {&row, value.fault, entry.line, std::string(entry.value.substr(0, PathText::Capacity()))});
+    configuration.complaints.push_back({&row, value.fault, entry.line, std::string(entry.value.substr(0, PathText::Capacity()))});
   });
 }
 
@@ -118,8 +117,8 @@ std::span<const ValueComplaint> ConfigurationComplaints() { return TheConfigurat
 SetResult SetSetting(std::string_view key, std::string_view value) {
   const KeyRow* const row = FindKey(key);
   if (row == nullptr) {
-    return {SetResult::UnknownKey, "There is no key \"" + std::string(key) + "\"; the nearest is " +
-                                       std::string(NearestKey(key)) + "."};
+    return {SetResult::UnknownKey,
+            "There is no key \"" + std::string(key) + "\"; the nearest is " + std::string(NearestKey(key)) + "."};
   }
   const SettingValue read = ReadValue(*row, value, ValueSource::Person);
   if (!read.usable) return {SetResult::WrongValue, FaultMessage(*row, read.fault)};

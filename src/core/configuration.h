@@ -25,7 +25,7 @@ std::string ConfigurationPath();
 
 enum class ConfigurationState {
   NotLoaded,
-  Missing,     // the defaults stand
+  Missing,  // the defaults stand
   Loaded,
   Unreadable,  // it is there and cannot be read, is longer than 16 MiB or not a text of bytes: the defaults stand, and nothing
                // is written in this run

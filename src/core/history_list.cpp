@@ -26,19 +26,14 @@ struct ListFile {
 
 // In the order of HistoryList.
 constexpr ListFile kLists[] = {
-    {"FMWMoveCopyHistory.txt", &Settings::CopyHistoryMax},
-    {"FMWDestinationHistory.txt", &Settings::DestHistoryMax},
-    {"FMWArchiveHistory.txt", &Settings::ArchiveHistoryMax},
-    {"FMWPicturesearchHistory.txt", &Settings::PictureSearchHistoryMax},
-    {"FMWTabHistory.txt", &Settings::TabHistoryMax},
-    {"FMWRenameHistory.txt", &Settings::EditListMaximum},
+    {"FMWMoveCopyHistory.txt", &Settings::CopyHistoryMax},   {"FMWDestinationHistory.txt", &Settings::DestHistoryMax},
+    {"FMWArchiveHistory.txt", &Settings::ArchiveHistoryMax}, {"FMWPicturesearchHistory.txt", &Settings::PictureSearchHistoryMax},
+    {"FMWTabHistory.txt", &Settings::TabHistoryMax},         {"FMWRenameHistory.txt", &Settings::EditListMaximum},
 };
 constexpr ListFile kRecentFiles{"FileMenuHistory.txt", &Settings::RecentFilesMaximum};
 
 const ListFile& FileOf(HistoryList list) { return kLists[static_cast<size_t>(list)]; }
-size_t MostOf(const ListFile& file) {
-  return static_cast<size_t>(std::clamp(settings.*file.maximum, 0, kMostEntries));
-}
+size_t MostOf(const ListFile& file) { return static_cast<size_t>(std::clamp(settings.*file.maximum, 0, kMostEntries)); }
 
 bool FitsOnLine(std::string_view entry) {
   return !entry.empty() && entry.size() <= PathText::Capacity() &&
@@ -144,9 +139,7 @@ bool ClearHistoryList(HistoryList list) {
   return EditList(FileOf(list), [](std::string& text) { text.clear(); });
 }
 
-std::vector<RecentFile> LoadRecentFiles() {
-  return ParseRecentFiles(ReadList(kRecentFiles), MostOf(kRecentFiles));
-}
+std::vector<RecentFile> LoadRecentFiles() { return ParseRecentFiles(ReadList(kRecentFiles), MostOf(kRecentFiles)); }
 
 bool AddRecentFile(const RecentFile& file) {
   if (!FitsOnLine(file.path)) return false;

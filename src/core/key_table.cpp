@@ -13,8 +13,23 @@ namespace fotomill {
 namespace {
 
 enum class Kind : uint8_t {
-  Flag, LooseFlag, SetupFlag, Integer, Spin, SetupSpin, Colour, Choice, ValueChoice, InternalInteger,
-  Text, SetupText, Name, InternalText, StatusText, Destination, Prefix,
+  Flag,
+  LooseFlag,
+  SetupFlag,
+  Integer,
+  Spin,
+  SetupSpin,
+  Colour,
+  Choice,
+  ValueChoice,
+  InternalInteger,
+  Text,
+  SetupText,
+  Name,
+  InternalText,
+  StatusText,
+  Destination,
+  Prefix,
 };
 
 constexpr uint32_t TypeOf(Kind kind) {
@@ -64,7 +79,9 @@ constexpr uint16_t kTags[] = {
 };
 
 template <size_t capacity>
-constexpr void* VariableOf(FixedText<capacity>& text) { return text.data(); }
+constexpr void* VariableOf(FixedText<capacity>& text) {
+  return text.data();
+}
 constexpr void* VariableOf(int32_t& number) { return &number; }
 
 // A choice has a list, a limited text its limit, no other row an extra word.
@@ -109,7 +126,8 @@ constinit const KeyTable keyTable = {{
 #define SETTING(kind, key, control, extra, value) {#key, VariableOf(settings.key), TypeOf(Kind::kind), control, extra},
 #include "core/settings.def"
 #undef SETTING
-}, kKeyCount};
+                                     },
+                                     kKeyCount};
 static_assert(offsetof(KeyTable, count) == kKeyCount * sizeof(KeyRow));
 
 size_t NumberOfKey(const KeyRow& row) {

@@ -28,8 +28,8 @@ enum KeyType : uint32_t {
 
 // The last word of a row: the list of a choice, or the longest text of a limited one, else 0.
 union KeyExtra {
-  constexpr KeyExtra(int32_t limit) : textLimit(static_cast<uintptr_t>(limit)) {}       // NOLINT: a cell of the table
-  constexpr KeyExtra(const ChoiceEntry* list) : choices(list) {}  // NOLINT: likewise
+  constexpr KeyExtra(int32_t limit) : textLimit(static_cast<uintptr_t>(limit)) {}  // NOLINT: a cell of the table
+  constexpr KeyExtra(const ChoiceEntry* list) : choices(list) {}                   // NOLINT: likewise
   uintptr_t textLimit;
   const ChoiceEntry* choices;
 };

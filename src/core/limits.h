@@ -6,15 +6,15 @@ namespace fotomill {
 
 // What one file may cost at most, in one place. Anything beyond is refused before memory is taken or a loop is begun.
 struct Limits {
-  uint64_t packedBlockBytes = uint64_t{1} << 30;   // a packed bitmap: 40-byte header, palette and rows; then status 6
-  uint64_t textScanBytes = uint64_t{16} << 20;     // bytes of a text format scanned without meeting a value
-  uint64_t listFileBytes = uint64_t{16} << 20;     // an INI, override, history or list file
-  uint32_t fitsCards = 65536;                      // cards of one FITS header
-  uint32_t exifDirectories = 512;                  // directories of one EXIF block
-  uint32_t exifEntries = 65536;                    // entries in all directories of one EXIF block
-  uint32_t exifValueCharacters = 4096;             // text of one value
-  uint64_t exifTextBytes = uint64_t{4} << 20;      // text of one block
-  uint64_t metadataBytes = uint64_t{64} << 20;     // one EXIF, XMP or ICC block kept with a picture
+  uint64_t packedBlockBytes = uint64_t{1} << 30;  // a packed bitmap: 40-byte header, palette and rows; then status 6
+  uint64_t textScanBytes = uint64_t{16} << 20;    // bytes of a text format scanned without meeting a value
+  uint64_t listFileBytes = uint64_t{16} << 20;    // an INI, override, history or list file
+  uint32_t fitsCards = 65536;                     // cards of one FITS header
+  uint32_t exifDirectories = 512;                 // directories of one EXIF block
+  uint32_t exifEntries = 65536;                   // entries in all directories of one EXIF block
+  uint32_t exifValueCharacters = 4096;            // text of one value
+  uint64_t exifTextBytes = uint64_t{4} << 20;     // text of one block
+  uint64_t metadataBytes = uint64_t{64} << 20;    // one EXIF, XMP or ICC block kept with a picture
 };
 
 // The limits in force. Changed at start-up only (big machines, tests).

@@ -29,14 +29,10 @@ const std::array<uint32_t, 64>& Sines() {
 
 uint32_t Mix(unsigned round, uint32_t b, uint32_t c, uint32_t d) {
   switch (round) {
-    case 0:
-      return (b & c) | (~b & d);
-    case 1:
-      return (b & d) | (c & ~d);
-    case 2:
-      return b ^ c ^ d;
-    default:
-      return c ^ (b | ~d);
+    case 0: return (b & c) | (~b & d);
+    case 1: return (b & d) | (c & ~d);
+    case 2: return b ^ c ^ d;
+    default: return c ^ (b | ~d);
   }
 }
 

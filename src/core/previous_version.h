@@ -20,7 +20,6 @@ struct CarryOver {
 CarryOver CarryOverDataFolder(const std::string& previous, const std::string& current);
 
 inline constexpr std::string_view kPreviousConfigurationFile = "Fotomill Professional 10.ini";
-inline constexpr std::string_view kCarriedFiles =
-    "*.browser;*.txt;Fotomill.tdb;FMWFileHistoryDatabase.fhdb;*.ccl;*.list";
+inline constexpr std::string_view kCarriedFiles = "*.browser;*.txt;Fotomill.tdb;FMWFileHistoryDatabase.fhdb;*.ccl;*.list";
 
 }  // namespace fotomill

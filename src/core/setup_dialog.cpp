@@ -82,7 +82,7 @@ void FillControl(SetupDialog& dialog, const DestinationSource& destinations, con
 // What a control holds for its key.
 struct ControlValue {
   const KeyRow* row;
-  std::string text;  // the value as the configuration file would hold it
+  std::string text;   // the value as the configuration file would hold it
   std::string fault;  // what the key takes instead
 };
 

@@ -6,7 +6,7 @@
 namespace fotomill {
 
 // Outcome of every codec, registry and batch operation. The number indexes the user message table.
-enum class [[nodiscard]] Status : int32_t {
+enum class [[nodiscard]] Status : int32_t{
 #define STATUS(number, name, message) name = number,
 #include "core/status.def"
 #undef STATUS
@@ -27,8 +27,8 @@ constexpr std::string_view StatusMessage(Status status) {
 }
 
 // Passes any status but Ok on to the caller.
-#define RETURN_IF_BAD(expression)                                                        \
-  do {                                                                                   \
+#define RETURN_IF_BAD(expression)                                                                           \
+  do {                                                                                                      \
     if (const ::fotomill::Status status_ = (expression); status_ != ::fotomill::Status::Ok) return status_; \
   } while (false)
 

@@ -39,11 +39,11 @@ RgbImage SmallCopy(const PictureRecord& picture, int32_t side) {
 OverwritePreview MakeOverwritePreview(const OverwriteQuestion& question, int32_t side) {
   OverwritePreview preview;
   const platform::FileFacts there = platform::FactsOf(question.path);
-  const ThumbnailPointer existing =
-      LoadThumbnail({question.path, there.modified, there.size, side, choice::kVirtual});
+  const ThumbnailPointer existing = LoadThumbnail({question.path, there.modified, there.size, side, choice::kVirtual});
   preview.existing = existing->pixels;
   preview.existingText = SizeText(there.size, choice::kSizeFitting) + "\n" + DateText(there.modified);
-  if (existing->width > 0) preview.existingText.append("\n").append(DimensionsText(existing->width, existing->height, existing->bits));
+  if (existing->width > 0)
+    preview.existingText.append("\n").append(DimensionsText(existing->width, existing->height, existing->bits));
   if (question.picture == nullptr) return preview;
   const PictureRecord& incoming = *question.picture;
   if (!incoming.image.Empty()) preview.incoming = SmallCopy(incoming, side);

@@ -76,7 +76,7 @@ class BatchThread {
   std::thread thread_;
   std::mutex mutex_;
   std::condition_variable answered_;
-  bool given_ = false;   // up
+  bool given_ = false;    // up
   bool running_ = false;  // belongs to the window's thread
 };
 

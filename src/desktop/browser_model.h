@@ -73,11 +73,11 @@ class BrowserModel {
   BrowserModes modes_;
   bool descending_ = false;
   std::string filter_;
-  std::vector<FolderItem> items_;   // as listed
-  std::vector<uint32_t> order_;     // all items in sorted order
-  std::vector<uint32_t> lines_;     // those that pass the filter
+  std::vector<FolderItem> items_;     // as listed
+  std::vector<uint32_t> order_;       // all items in sorted order
+  std::vector<uint32_t> lines_;       // those that pass the filter
   std::vector<bool> hiddenSelected_;  // items that are selected though the filter hides them
-  Selection selection_;             // over the lines
+  Selection selection_;               // over the lines
 };
 
 // A size for people: "740 bytes", "18.2 MB"; by choice::SizeMode.

@@ -45,7 +45,8 @@ std::string DestinationProblem(const DestinationChoice& choice) {
   if (row == kNoFormat || !CanWrite(FormatRow(row))) return "The format cannot be written.";
   if (choice.folder.empty()) return {};
   if (choice.folder.size() > PathText::Capacity()) return "The path of the folder is longer than 260 characters.";
-  if (platform::FileExists(choice.folder) && !platform::IsFolder(choice.folder)) return "\"" + choice.folder + "\" is not a folder.";
+  if (platform::FileExists(choice.folder) && !platform::IsFolder(choice.folder))
+    return "\"" + choice.folder + "\" is not a folder.";
   return {};
 }
 

@@ -22,8 +22,8 @@ struct ExifReport {
   Status status = Status::Ok;
   std::string problem;  // a sentence for people where there is nothing to show, or not all; empty otherwise
   std::vector<ExifRow> rows;
-  std::string text;     // the same lines as one text, to be copied, saved or printed
-  RgbImage thumbnail;   // decoded; empty when there is none that can be
+  std::string text;                     // the same lines as one text, to be copied, saved or printed
+  RgbImage thumbnail;                   // decoded; empty when there is none that can be
   std::vector<uint8_t> thumbnailBytes;  // as it lies in the block: a JPEG stream
 };
 

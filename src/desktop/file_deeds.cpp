@@ -32,7 +32,8 @@ Outcome CopyFile(const std::string& from, const std::string& to) {
   if (!output.Create(to)) return "The folder cannot be written to.";
   const auto bytes = view.Bytes();
   for (size_t at = 0; at < bytes.size(); at += kPart) {
-    if (!output.Write(bytes.subspan(at, std::min(kPart, bytes.size() - at)))) return "The copy could not be written; the disk may be full.";
+    if (!output.Write(bytes.subspan(at, std::min(kPart, bytes.size() - at))))
+      return "The copy could not be written; the disk may be full.";
   }
   if (!view.Intact()) return "It was cut short while it was copied.";
   const platform::CommitResult result = output.Commit(platform::Existing::Refuse);
@@ -51,8 +52,9 @@ Outcome CopyTree(const std::string& from, const std::string& to, int depth) {
   if (!entries) return "The folder cannot be read.";
   if (!platform::MakeFolders(to)) return "The folder cannot be made.";
   for (const platform::FolderEntry& entry : *entries) {
-    Outcome outcome = entry.link ? Outcome("It holds a link, which is not copied.")
-                                 : CopyTree(platform::JoinFolder(from, entry.name), platform::JoinFolder(to, entry.name), depth + 1);
+    Outcome outcome = entry.link
+                          ? Outcome("It holds a link, which is not copied.")
+                          : CopyTree(platform::JoinFolder(from, entry.name), platform::JoinFolder(to, entry.name), depth + 1);
     if (!outcome.empty()) return outcome;
   }
   return {};
@@ -160,7 +162,9 @@ FileDeed PlanDeed(DeedKind kind, const std::vector<std::string>& paths, const st
     }
     std::string target = platform::JoinFolder(folder, platform::FileNameOf(path));
     if (kind == DeedKind::Move && target == path) continue;
-    const TakenTest taken = [&](const std::string& candidate) { return planned.contains(candidate) || platform::FileExists(candidate); };
+    const TakenTest taken = [&](const std::string& candidate) {
+      return planned.contains(candidate) || platform::FileExists(candidate);
+    };
     if (taken(target)) (void)MakeNumberedVariant(target, settings.NumberedVariantMin, settings.NumberedVariantMax, taken);
     planned.insert(target);
     deed.steps.push_back({path, target});

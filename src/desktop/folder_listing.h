@@ -13,9 +13,9 @@ struct FolderItem {
   bool folder = false;
   int32_t format = -1;  // row of the registry
   uint64_t size = 0;
-  int64_t modified = 0;      // seconds since 1970-01-01 UTC
+  int64_t modified = 0;                     // seconds since 1970-01-01 UTC
   int32_t width = 0, height = 0, bits = 0;  // 0 until somebody has read the file's header
-  int64_t taken = 0;         // the EXIF date as a number that sorts, 0 without one or before somebody has read it
+  int64_t taken = 0;                        // the EXIF date as a number that sorts, 0 without one or before somebody has read it
 
   bool operator==(const FolderItem&) const = default;
 };

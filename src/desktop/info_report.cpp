@@ -47,7 +47,9 @@ std::string PrintSize(const PictureRecord& picture) {
   std::string text;
   switch (settings.InfoUnits) {
     case choice::kPixels: return {};
-    case choice::kCentimetres: text = Printed("%.2f x %.2f centimeters", picture.width / x * 2.54, picture.height / y * 2.54); break;
+    case choice::kCentimetres:
+      text = Printed("%.2f x %.2f centimeters", picture.width / x * 2.54, picture.height / y * 2.54);
+      break;
     default: text = Printed("%.2f x %.2f inches", picture.width / x, picture.height / y);
   }
   return own ? text : text + Printed(how, assumed);
@@ -96,7 +98,8 @@ InfoSection DetailsOf(const PictureRecord& picture) {
     } else {
       // Codecs put blanks in front of the names, so that the values of their lines stand in one column.
       const std::string_view name = line.substr(0, colon);
-      section.lines.push_back({std::string(name.substr(std::min(name.find_first_not_of(' '), colon))), std::string(line.substr(colon + 2))});
+      section.lines.push_back(
+          {std::string(name.substr(std::min(name.find_first_not_of(' '), colon))), std::string(line.substr(colon + 2))});
     }
   }
   return section;

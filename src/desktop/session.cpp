@@ -71,8 +71,9 @@ std::string SessionText(const Session& session) {
                      Line("Maximized", session.maximized ? 1 : 0) + Line("Tab", static_cast<int64_t>(session.tab));
   for (const SessionTab& tab : session.tabs) {
     if (!FitsLine(tab.folder)) continue;
-    text += "[Tab]\n" + Line("Folder", tab.folder) + Line("ThumbnailMode", tab.modes.thumbnails) + Line("ViewMode", tab.modes.view) +
-            Line("SortMode", tab.modes.sort) + Line("Descending", tab.descending ? 1 : 0) + Line("Scroll", tab.scroll);
+    text += "[Tab]\n" + Line("Folder", tab.folder) + Line("ThumbnailMode", tab.modes.thumbnails) +
+            Line("ViewMode", tab.modes.view) + Line("SortMode", tab.modes.sort) + Line("Descending", tab.descending ? 1 : 0) +
+            Line("Scroll", tab.scroll);
     if (FitsLine(tab.focus)) text += Line("Focus", tab.focus);
   }
   return text;

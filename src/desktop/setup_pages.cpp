@@ -128,8 +128,8 @@ constexpr SetupItem kItems[] = {
 };
 // clang-format on
 
-constexpr const char* kTitles[] = {"Browsing", "Thumbnails", "Viewing", "Batches", "Saving",
-                                   "File names", "Colors", "EXIF and info", "File history", "Formats"};
+constexpr const char* kTitles[] = {"Browsing",   "Thumbnails", "Viewing",       "Batches",      "Saving",
+                                   "File names", "Colors",     "EXIF and info", "File history", "Formats"};
 static_assert(std::size(kTitles) == kSetupPageCount);
 
 consteval bool EveryItemIsShownOnce() {
@@ -168,7 +168,8 @@ std::vector<SetupItem> FindSettings(std::string_view words) {
   for (const SetupItem& item : kItems) {
     const std::string text = SearchedText(item);
     bool all = true;
-    for (size_t end = 0, start = wanted.find_first_not_of(' '); start != std::string::npos; start = wanted.find_first_not_of(' ', end)) {
+    for (size_t end = 0, start = wanted.find_first_not_of(' '); start != std::string::npos;
+         start = wanted.find_first_not_of(' ', end)) {
       end = std::min(wanted.find(' ', start), wanted.size());
       all = all && text.find(wanted.substr(start, end - start)) != std::string::npos;
     }

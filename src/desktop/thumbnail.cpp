@@ -27,7 +27,8 @@ bool ReadCurrentFile(const ThumbnailWish& wish, ThumbnailRecord& record) {
 bool InDatabase(const ThumbnailWish& wish) { return wish.mode == choice::kGlobalDatabase || wish.mode == choice::kLocalDatabase; }
 
 std::string DatabaseFor(const ThumbnailWish& wish) {
-  return ThumbnailDatabasePath(wish.mode == choice::kGlobalDatabase ? std::string() : std::string(platform::SplitPath(wish.path).folder));
+  return ThumbnailDatabasePath(wish.mode == choice::kGlobalDatabase ? std::string()
+                                                                    : std::string(platform::SplitPath(wish.path).folder));
 }
 
 // The database that was asked last stays open: its index is what makes a search quick. New records are gathered, since
@@ -93,8 +94,8 @@ Status PixelsOfRecord(const ThumbnailRecord& record, RgbImage& pixels) {
 Status ScaleDown(const PackedImage& image, int32_t side, RgbImage& pixels) {
   if (image.Width() <= side && image.Height() <= side) return ToRgb(image, pixels);
   PackedImage scaled, noAlpha, noScaledAlpha;
-  RETURN_IF_BAD(ScaleFiltered(image, noAlpha, FitSize(image.Width(), image.Height(), side), ScaleFilter::Bicubic, scaled,
-                              noScaledAlpha));
+  RETURN_IF_BAD(
+      ScaleFiltered(image, noAlpha, FitSize(image.Width(), image.Height(), side), ScaleFilter::Bicubic, scaled, noScaledAlpha));
   return ToRgb(scaled, pixels);
 }
 
@@ -110,7 +111,8 @@ Status MakeFromPicture(const ThumbnailWish& wish, Thumbnail& thumbnail) {
   thumbnail.alpha = !picture->alpha.Empty();
   RETURN_IF_BAD(PrepareForDisplay(*picture, static_cast<Color>(settings.ThumbnailMatte)));
   ThumbnailRecord record;
-  if (InDatabase(wish) && settings.AutoCreateThumbnail != 0 && MakeThumbnailRecord(record, *picture)) openDatabase.Add(wish, record);
+  if (InDatabase(wish) && settings.AutoCreateThumbnail != 0 && MakeThumbnailRecord(record, *picture))
+    openDatabase.Add(wish, record);
   return ScaleDown(picture->image, wish.side, thumbnail.pixels);
 }
 

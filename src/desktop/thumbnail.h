@@ -21,8 +21,8 @@ struct ThumbnailWish {
 };
 
 struct Thumbnail {
-  Status status = Status::Ok;  // why there are no pixels
-  RgbImage pixels;             // never larger than the square, nor enlarged
+  Status status = Status::Ok;                          // why there are no pixels
+  RgbImage pixels;                                     // never larger than the square, nor enlarged
   int32_t width = 0, height = 0, bits = 0, pages = 1;  // of the picture, 0 when it was not opened
   bool alpha = false;
 

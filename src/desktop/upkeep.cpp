@@ -22,14 +22,18 @@ constexpr int kDeepest = 64;  // folders below folders
 std::string OutcomeText(Compacted result, int32_t before, int32_t after, uint64_t saved) {
   switch (result) {
     case Compacted::Done:
-      if (before == after) return "There was nothing to drop: all " + WithThousands(static_cast<uint64_t>(after)) + " records stay.";
-      return WithThousands(static_cast<uint64_t>(before - after)) + (before - after == 1 ? " record was dropped, " : " records were dropped, ") +
-             WithThousands(static_cast<uint64_t>(after)) + " stay. The file is " + SizeText(saved, choice::kSizeFitting) + " smaller.";
+      if (before == after)
+        return "There was nothing to drop: all " + WithThousands(static_cast<uint64_t>(after)) + " records stay.";
+      return WithThousands(static_cast<uint64_t>(before - after)) +
+             (before - after == 1 ? " record was dropped, " : " records were dropped, ") +
+             WithThousands(static_cast<uint64_t>(after)) + " stay. The file is " + SizeText(saved, choice::kSizeFitting) +
+             " smaller.";
     case Compacted::Stopped: return "Stopped. The database stays as it was.";
     case Compacted::NotRead: return std::string(StatusMessage(Status::FileReadError)) + " The database stays as it was.";
     case Compacted::Failed: break;
   }
-  return std::string(StatusMessage(Status::ErrorWritingFile)) + " The database stays as it was. Is the disk full, or the folder protected?";
+  return std::string(StatusMessage(Status::ErrorWritingFile)) +
+         " The database stays as it was. Is the disk full, or the folder protected?";
 }
 
 void CollectOrphans(const std::string& folder, int depth, const std::atomic<bool>& stop, std::vector<std::string>& orphans) {

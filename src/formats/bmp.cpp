@@ -85,9 +85,7 @@ struct BmpHeader {
   uint64_t PaletteEntrySize() const { return IsOs2() ? 3 : 4; }
   uint64_t PaletteSize() const { return bits > 8 ? 0 : (uint64_t{1} << bits) * PaletteEntrySize(); }
   bool HasMasks() const { return compression == kBitFields && bits == 16; }
-  uint64_t PixelOffset() const {
-    return IsOs2() ? PaletteOffset() + PaletteSize() : pixelOffset + (HasMasks() ? kMasksSize : 0);
-  }
+  uint64_t PixelOffset() const { return IsOs2() ? PaletteOffset() + PaletteSize() : pixelOffset + (HasMasks() ? kMasksSize : 0); }
 };
 
 // Ok, or DamagedFile without the signature or a whole header.
@@ -149,8 +147,7 @@ Status DescribePicture(const platform::FileView& file, const BmpHeader& header, 
 
 // What one row becomes. `source` is a row of the file, which may be short only where the reader allows it; `row` a row
 // of the picture and `alpha` one of its alpha plane (empty without one), padding included. Writes all of `row`.
-using RowReader = void (*)(std::span<const uint8_t> source, int32_t width, std::span<uint8_t> row,
-                           std::span<uint8_t> alpha);
+using RowReader = void (*)(std::span<const uint8_t> source, int32_t width, std::span<uint8_t> row, std::span<uint8_t> alpha);
 
 void CopyRow(std::span<const uint8_t> source, int32_t, std::span<uint8_t> row, std::span<uint8_t>) {
   const size_t count = std::min(source.size(), row.size());
@@ -206,8 +203,7 @@ Status ReadMasks(std::span<const uint8_t> file, bool& is565) {
   return bytes.Ok() ? Status::Ok : Status::FileReadError;
 }
 
-Status ChooseRowReader(const platform::FileView& file, const BmpHeader& header, const PackedImage& alpha,
-                       RowReader& reader) {
+Status ChooseRowReader(const platform::FileView& file, const BmpHeader& header, const PackedImage& alpha, RowReader& reader) {
   reader = CopyRow;
   if (header.bits == 16) {
     bool is565 = false;
@@ -227,9 +223,7 @@ Status CheckRowsFit(const platform::FileView& file, const BmpHeader& header) {
   return counted && end <= file.FileSize() ? Status::Ok : Status::FileReadError;
 }
 
-int32_t RowsPerChunk(uint64_t stride) {
-  return static_cast<int32_t>(std::max<uint64_t>(kChunkSize / stride, 1));
-}
+int32_t RowsPerChunk(uint64_t stride) { return static_cast<int32_t>(std::max<uint64_t>(kChunkSize / stride, 1)); }
 
 // Rows that lie in the file as in the picture go straight into it.
 Status ReadRowsUnchanged(const platform::FileView& file, const BmpHeader& header, const PictureRecord& picture,
@@ -247,16 +241,15 @@ Status ReadRowsUnchanged(const platform::FileView& file, const BmpHeader& header
   return Status::Ok;
 }
 
-Status ReadRowsConverted(platform::FileView& file, const BmpHeader& header, const PictureRecord& picture,
-                         RowReader readRow, PackedImage& image, PackedImage& alpha) {
+Status ReadRowsConverted(platform::FileView& file, const BmpHeader& header, const PictureRecord& picture, RowReader readRow,
+                         PackedImage& image, PackedImage& alpha) {
   const int32_t height = image.Height();
   const uint64_t stride = header.FileStride();
   for (int32_t r = 0; r < height; ++r) {
     const uint64_t offset = header.PixelOffset() + static_cast<uint64_t>(r) * stride;
     const std::span<const uint8_t> source = file.Bytes().subspan(offset, std::min(stride, file.FileSize() - offset));
     const int32_t stored = header.TopDown() ? height - 1 - r : r;
-    readRow(source, header.width, image.StoredRow(stored),
-            alpha.Empty() ? std::span<uint8_t>() : alpha.StoredRow(stored));
+    readRow(source, header.width, image.StoredRow(stored), alpha.Empty() ? std::span<uint8_t>() : alpha.StoredRow(stored));
     file.DropBefore(offset);
     picture.ReportRow(r);
   }
@@ -267,9 +260,7 @@ Status ReadRowsConverted(platform::FileView& file, const BmpHeader& header, cons
 struct Rle8 {
   static constexpr uint64_t kPixelsPerByte = 1;
   static void Run(uint8_t* row, uint64_t x, uint64_t count, uint8_t value) { std::memset(row + x, value, count); }
-  static void Literal(uint8_t* row, uint64_t x, uint64_t count, const uint8_t* data) {
-    std::memcpy(row + x, data, count);
-  }
+  static void Literal(uint8_t* row, uint64_t x, uint64_t count, const uint8_t* data) { std::memcpy(row + x, data, count); }
 };
 
 // Pixels of 4 bits: a run alternates between the high and the low half of its value.
@@ -295,17 +286,14 @@ struct Rle4 {
 //
 // FileReadError when the data end before an end of bitmap.
 template <typename Kind>
-Status DecodeRunLength(platform::FileView& file, const BmpHeader& header, const PictureRecord& picture,
-                       PackedImage& image) {
+Status DecodeRunLength(platform::FileView& file, const BmpHeader& header, const PictureRecord& picture, PackedImage& image) {
   const int32_t height = image.Height();
   const uint64_t limit = std::min<uint64_t>(header.width, image.Stride() * Kind::kPixelsPerByte);
   ByteReader bytes(file.Bytes());
   bytes.Seek(header.PixelOffset());
   uint64_t x = 0, y = 0;
   // How many of `count` pixels at (x, y) lie in the picture, and where the row begins.
-  const auto inside = [&](uint64_t count) {
-    return y < uint64_t(height) && x < limit ? std::min(count, limit - x) : 0;
-  };
+  const auto inside = [&](uint64_t count) { return y < uint64_t(height) && x < limit ? std::min(count, limit - x) : 0; };
   const auto row = [&] { return image.StoredRow(static_cast<int32_t>(header.TopDown() ? height - 1 - y : y)).data(); };
   while (bytes.Left() >= 2) {
     const uint8_t count = bytes.U8(), code = bytes.U8();
@@ -349,14 +337,13 @@ struct BmpLayout {
 Status ChooseLayout(const PictureRecord& picture, BmpLayout& layout) {
   const PackedImage& image = picture.image;
   layout.os2 = settings.WriteOS2Bitmaps != 0;
-  layout.alpha = !layout.os2 && image.Bits() == 24 && picture.alpha.Width() == image.Width() &&
-                 picture.alpha.Height() == image.Height();
+  layout.alpha =
+      !layout.os2 && image.Bits() == 24 && picture.alpha.Width() == image.Width() && picture.alpha.Height() == image.Height();
   layout.width = image.Width();
   layout.height = image.Height();
   layout.bits = layout.alpha ? 32 : image.Bits();
   layout.colors = static_cast<uint32_t>(image.Colors());
-  layout.pixelOffset =
-      static_cast<uint32_t>(layout.os2 ? kOs2HeaderSize + 3 * layout.colors : kHeaderSize + 4 * layout.colors);
+  layout.pixelOffset = static_cast<uint32_t>(layout.os2 ? kOs2HeaderSize + 3 * layout.colors : kHeaderSize + 4 * layout.colors);
   const uint64_t rowBytes = RowStride(layout.width, layout.bits) * static_cast<uint64_t>(layout.height);
   if (rowBytes > UINT32_MAX - layout.pixelOffset) return Status::UnsuitableImage;
   if (layout.os2 && (layout.width > UINT16_MAX || layout.height > UINT16_MAX)) return Status::UnsuitableImage;
@@ -405,8 +392,7 @@ void WriteRowsUnchanged(ByteWriter& out, const PictureRecord& picture) {
   for (int32_t r = 0; r < image.Height() && !out.Failed(); r += step) {
     const int32_t count = std::min(step, image.Height() - r);
     for (int32_t i = 0; i < count; ++i) picture.ReportRow(r + i);
-    out.Bytes(
-        image.Rows().subspan(static_cast<uint64_t>(r) * image.Stride(), static_cast<uint64_t>(count) * image.Stride()));
+    out.Bytes(image.Rows().subspan(static_cast<uint64_t>(r) * image.Stride(), static_cast<uint64_t>(count) * image.Stride()));
   }
 }
 

@@ -10,8 +10,7 @@ namespace fotomill {
 
 namespace {
 
-constexpr uint16_t kExifPointer = 0x8769, kGpsPointer = 0x8825, kInteroperabilityPointer = 0xA005,
-                   kOrientation = 0x0112;
+constexpr uint16_t kExifPointer = 0x8769, kGpsPointer = 0x8825, kInteroperabilityPointer = 0xA005, kOrientation = 0x0112;
 constexpr uint16_t kShort = 3, kLong = 4;
 constexpr uint16_t kMostTypes = 13;
 constexpr uint8_t kUnitBytes[kMostTypes + 1] = {0, 1, 1, 2, 4, 4, 1, 1, 2, 4, 4, 4, 8, 4};  // that swap together
@@ -21,9 +20,7 @@ constexpr uint8_t kValueBytes[kMostTypes + 1] = {0, 1, 1, 2, 4, 8, 1, 1, 2, 4, 8
 constexpr uint16_t kDescriptive[] = {0x010D, 0x010E, 0x010F, 0x0110, kOrientation, 0x0131, 0x0132, 0x013B, 0x013C,
                                      0x4746, 0x4749, 0x8298, 0x9C9B, 0x9C9C,       0x9C9D, 0x9C9E, 0x9C9F};
 
-bool IsPointer(uint16_t tag) {
-  return tag == kExifPointer || tag == kGpsPointer || tag == kInteroperabilityPointer;
-}
+bool IsPointer(uint16_t tag) { return tag == kExifPointer || tag == kGpsPointer || tag == kInteroperabilityPointer; }
 
 class DirectoryReader {
  public:
@@ -58,9 +55,7 @@ class DirectoryReader {
     const uint64_t value = form_.wide ? Wide(bytes) : Long(bytes);
     if (!bytes.Ok()) return;
     if (IsPointer(entry.tag)) {
-      (entry.tag == kExifPointer  ? result.exif
-       : entry.tag == kGpsPointer ? result.gps
-                                  : result.interoperability) = value;
+      (entry.tag == kExifPointer ? result.exif : entry.tag == kGpsPointer ? result.gps : result.interoperability) = value;
       return;
     }
     if (entry.type == 0 || entry.type > kMostTypes || count > bytesLeft_) return;
@@ -91,8 +86,7 @@ class DirectoryWriter {
   // Writes a directory with its values; where it lies, 0 for an empty one.
   uint32_t Write(ExifDirectory directory) {
     if (directory.empty()) return 0;
-    std::stable_sort(directory.begin(), directory.end(),
-                     [](const ExifEntry& a, const ExifEntry& b) { return a.tag < b.tag; });
+    std::stable_sort(directory.begin(), directory.end(), [](const ExifEntry& a, const ExifEntry& b) { return a.tag < b.tag; });
     const uint32_t start = Position();
     Short(static_cast<uint16_t>(directory.size()));
     uint32_t place = start + static_cast<uint32_t>(2 + 12 * directory.size() + 4);
@@ -127,8 +121,7 @@ class DirectoryWriter {
 
  private:
   void Number(uint32_t value, int count) {
-    for (int i = 0; i < count; ++i)
-      bytes_.push_back(static_cast<uint8_t>(value >> 8 * (bigEndian_ ? count - 1 - i : i)));
+    for (int i = 0; i < count; ++i) bytes_.push_back(static_cast<uint8_t>(value >> 8 * (bigEndian_ ? count - 1 - i : i)));
   }
   void Values(const ExifEntry& entry) {
     const size_t unit = swapped_ ? kUnitBytes[entry.type] : 1;
@@ -183,11 +176,9 @@ std::vector<uint8_t> MakeExifBlock(const ExifDirectories& directories) {
   std::vector<uint8_t> subdirectories, block;
   // The first directory stands in front: its size tells where the others begin.
   ExifDirectory first = directories.first;
-  const bool hasExif = !directories.exif.empty() || !directories.interoperability.empty(),
-             hasGps = !directories.gps.empty();
+  const bool hasExif = !directories.exif.empty() || !directories.interoperability.empty(), hasGps = !directories.gps.empty();
   uint64_t size = 8 + 2 + 12 * (first.size() + (hasExif ? 1 : 0) + (hasGps ? 1 : 0)) + 4;
-  for (const ExifEntry& entry : first)
-    size += entry.value.size() <= 4 ? 0 : entry.value.size() + entry.value.size() % 2;
+  for (const ExifEntry& entry : first) size += entry.value.size() <= 4 ? 0 : entry.value.size() + entry.value.size() % 2;
   DirectoryWriter behind(subdirectories, static_cast<uint32_t>(size), directories.bigEndian, false);
   uint32_t exif = 0, gps = 0;
   WriteSubdirectories(behind, directories, exif, gps);
@@ -222,8 +213,7 @@ PlacedExif PlaceExif(const ExifDirectories& directories, uint32_t base) {
 uint16_t OrientationOf(const ExifDirectories& directories) {
   for (const ExifEntry& entry : directories.first) {
     if (entry.tag != kOrientation || entry.type != kShort || entry.value.size() < 2) continue;
-    const int value =
-        directories.bigEndian ? entry.value[0] << 8 | entry.value[1] : entry.value[1] << 8 | entry.value[0];
+    const int value = directories.bigEndian ? entry.value[0] << 8 | entry.value[1] : entry.value[1] << 8 | entry.value[0];
     return value >= 1 && value <= 8 ? static_cast<uint16_t>(value) : uint16_t{1};
   }
   return 1;

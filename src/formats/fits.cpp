@@ -111,9 +111,7 @@ void CopyRow(std::span<const uint8_t> fileRow, std::span<uint8_t> row) {
 
 // So many hundredths of a level, rounded down. A product and a shift in place of a division: compilers do that for many
 // levels at once.
-constexpr uint32_t Share(uint8_t level, uint32_t hundredths) {
-  return level * ((hundredths * 65536 + 99) / 100) >> 16;
-}
+constexpr uint32_t Share(uint8_t level, uint32_t hundredths) { return level * ((hundredths * 65536 + 99) / 100) >> 16; }
 
 // Each channel's share is rounded for itself.
 constexpr uint32_t kRed = 30, kGreen = 59, kBlue = 11;
@@ -211,16 +209,15 @@ Status DescribePicture(const platform::FileView& file, PictureRecord& picture, F
   picture.imageBytes = EstimateImageBytes(picture.width, picture.height, 8);
   picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
   picture.palette = GreyRamp();
-  picture.typeName.AssignCut(std::to_string(header.axes) + " axis - " + std::to_string(header.bitsPerValue) +
-                             " bits of grey");
+  picture.typeName.AssignCut(std::to_string(header.axes) + " axis - " + std::to_string(header.bitsPerValue) + " bits of grey");
   return Status::Ok;
 }
 
 // Ok, or FileReadError when the header has no end or the file no room for its rows.
 Status CheckRowsFit(const platform::FileView& file, const FitsHeader& header) {
   uint64_t size = 0, end = 0;
-  const bool counted = CheckedMultiply(header.RowBytes(), static_cast<uint64_t>(header.height), size) &&
-                       CheckedAdd(size, header.dataOffset, end);
+  const bool counted =
+      CheckedMultiply(header.RowBytes(), static_cast<uint64_t>(header.height), size) && CheckedAdd(size, header.dataOffset, end);
   return header.ended && counted && end <= file.FileSize() ? Status::Ok : Status::FileReadError;
 }
 

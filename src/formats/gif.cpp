@@ -65,21 +65,19 @@ struct GifScreen {
 struct GifFrame {
   int32_t left = 0, top = 0, width = 0, height = 0;
   bool interlaced = false;
-  GifPalette palette;              // local, else global
+  GifPalette palette;  // local, else global
   int32_t transparent = kNoIndex;
   uint8_t disposal = 0;
-  uint16_t delay = 0;              // hundredths of a second
-  uint64_t dataOffset = 0;         // of the LZW data
-  uint8_t pixelBits = 0;           // as the LZW data say
+  uint16_t delay = 0;       // hundredths of a second
+  uint64_t dataOffset = 0;  // of the LZW data
+  uint8_t pixelBits = 0;    // as the LZW data say
 
   // Bits per pixel of the picture that this frame is. Two-colour frames are coded with 2 bits.
   int32_t Depth() const {
     if (palette.bits == 0) return std::clamp<int32_t>(pixelBits, 1, 8);
     return palette.bits == 1 && pixelBits <= 2 ? 1 : std::clamp<int32_t>(std::max<int32_t>(palette.bits, pixelBits), 1, 8);
   }
-  bool Covers(const GifScreen& screen) const {
-    return left == 0 && top == 0 && width >= screen.width && height >= screen.height;
-  }
+  bool Covers(const GifScreen& screen) const { return left == 0 && top == 0 && width >= screen.width && height >= screen.height; }
 };
 
 GifPalette TakePalette(ByteReader& bytes, uint8_t flags) {

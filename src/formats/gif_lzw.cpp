@@ -97,8 +97,7 @@ Status DecodeGifPixels(ByteReader& bytes, std::span<uint8_t> pixels) {
   return Status::Ok;
 }
 
-GifPixelEncoder::GifPixelEncoder(ByteWriter& out, int32_t bits)
-    : out_(out), clearCode_(1u << std::max(bits, 2)) {
+GifPixelEncoder::GifPixelEncoder(ByteWriter& out, int32_t bits) : out_(out), clearCode_(1u << std::max(bits, 2)) {
   out_.U8(static_cast<uint8_t>(std::max(bits, 2)));
   ClearTable();
   PutCode(clearCode_);

@@ -37,12 +37,12 @@ class GifPixelEncoder {
   const uint32_t clearCode_;
   uint32_t codeBits_ = 0;
   uint32_t nextCode_ = 0;
-  int32_t prefix_ = kNone;      // code of the string read so far
-  uint64_t pending_ = 0;        // bits not yet written, the oldest lowest
+  int32_t prefix_ = kNone;  // code of the string read so far
+  uint64_t pending_ = 0;    // bits not yet written, the oldest lowest
   uint32_t pendingBits_ = 0;
   uint8_t block_[255];
   size_t blockSize_ = 0;
-  uint32_t keys_[kTableSize];   // (prefix << 8 | pixel) + 1, 0 free
+  uint32_t keys_[kTableSize];  // (prefix << 8 | pixel) + 1, 0 free
   uint16_t codes_[kTableSize];
 };
 

@@ -65,29 +65,22 @@ double HalfToReal(uint16_t half) {
 // A sample as a real number, 1 being white.
 double RealSample(const uint8_t* source, HdpDepth depth) {
   switch (depth) {
-    case HdpDepth::Fixed16:
-      return Load<int16_t>(source) / kFixed16One;
-    case HdpDepth::Half:
-      return HalfToReal(Load<uint16_t>(source));
-    case HdpDepth::Fixed32:
-      return Load<int32_t>(source) / kFixed32One;
-    case HdpDepth::U32:
-      return Load<uint32_t>(source) / 4294967295.0;
-    default:
-      return Load<float>(source);
+    case HdpDepth::Fixed16: return Load<int16_t>(source) / kFixed16One;
+    case HdpDepth::Half: return HalfToReal(Load<uint16_t>(source));
+    case HdpDepth::Fixed32: return Load<int32_t>(source) / kFixed32One;
+    case HdpDepth::U32: return Load<uint32_t>(source) / 4294967295.0;
+    default: return Load<float>(source);
   }
 }
 
 bool IsLinear(HdpDepth depth) {
-  return depth == HdpDepth::Fixed16 || depth == HdpDepth::Half || depth == HdpDepth::Fixed32 ||
-         depth == HdpDepth::Float;
+  return depth == HdpDepth::Fixed16 || depth == HdpDepth::Half || depth == HdpDepth::Fixed32 || depth == HdpDepth::Float;
 }
 
 // `count` samples of a row as bytes, `step` of which make a pixel, the last one being alpha when there is alpha.
 void SamplesToBytes(const uint8_t* row, HdpDepth depth, size_t count, size_t step, bool alpha, uint8_t* target) {
   if (depth == HdpDepth::U16) {
-    for (size_t i = 0; i < count; ++i)
-      target[i] = static_cast<uint8_t>((Load<uint16_t>(row + 2 * i) * 255u + 32895) >> 16);
+    for (size_t i = 0; i < count; ++i) target[i] = static_cast<uint8_t>((Load<uint16_t>(row + 2 * i) * 255u + 32895) >> 16);
     return;
   }
   const size_t bytes = depth == HdpDepth::Fixed16 || depth == HdpDepth::Half ? 2 : 4;
@@ -108,8 +101,8 @@ void PackedToBytes(const uint8_t* row, HdpDepth depth, int32_t width, uint8_t* i
     return static_cast<uint8_t>(((value & most) * 255 + most / 2) / most);
   };
   for (int32_t x = 0; x < width; ++x, image += 3) {
-    const uint32_t pixel = outer == 10 ? Load<uint32_t>(row + 4 * static_cast<size_t>(x))
-                                       : Load<uint16_t>(row + 2 * static_cast<size_t>(x));
+    const uint32_t pixel =
+        outer == 10 ? Load<uint32_t>(row + 4 * static_cast<size_t>(x)) : Load<uint16_t>(row + 2 * static_cast<size_t>(x));
     image[0] = scaled(pixel, outer);
     image[1] = scaled(pixel >> outer, middle);
     image[2] = scaled(pixel >> (outer + middle), outer);
@@ -143,8 +136,7 @@ class HdpConverter {
     uint8_t* image = target_.image.Row(y).data();
     if (raster_.sampleBytes == 0) {
       std::memcpy(image, row, (static_cast<size_t>(form_.width) + 7) / 8);
-    } else if (form_.depth == HdpDepth::Rgb555 || form_.depth == HdpDepth::Rgb565 ||
-               form_.depth == HdpDepth::Rgb101010) {
+    } else if (form_.depth == HdpDepth::Rgb555 || form_.depth == HdpDepth::Rgb565 || form_.depth == HdpDepth::Rgb101010) {
       PackedToBytes(row, form_.depth, form_.width, image);
     } else if (form_.colors == HdpColors::Rgbe) {
       RgbeToBytes(row, form_.width, image);
@@ -196,8 +188,7 @@ class HdpConverter {
       alpha[x] = *source;
       if (!multiplied_) continue;
       for (size_t i = 0; i < 3; ++i) {
-        image[i] = *source == 0 ? uint8_t{0}
-                                : static_cast<uint8_t>(std::min(255u, (image[i] * 255u + *source / 2u) / *source));
+        image[i] = *source == 0 ? uint8_t{0} : static_cast<uint8_t>(std::min(255u, (image[i] * 255u + *source / 2u) / *source));
       }
     }
   }
@@ -227,8 +218,7 @@ void TakePalette(int32_t bits, Palette& palette) {
   }
   const int levels = 1 << bits;
   palette.fill(0);
-  for (int i = 0; i < levels; ++i)
-    std::fill_n(palette.begin() + 3 * i, 3, static_cast<uint8_t>(i * 255 / (levels - 1)));
+  for (int i = 0; i < levels; ++i) std::fill_n(palette.begin() + 3 * i, 3, static_cast<uint8_t>(i * 255 / (levels - 1)));
 }
 
 void Assign(std::vector<uint8_t>& block, std::span<const uint8_t> data) {
@@ -302,9 +292,7 @@ void AddDetails(const HdpPage& page, const PictureRecord& picture, DetailLines& 
 
 }  // namespace
 
-bool HdpWorksHere() {
-  return HasHdpLibrary();
-}
+bool HdpWorksHere() { return HasHdpLibrary(); }
 
 Status HdpInfo(PictureRecord& picture, const char* fileName, uint32_t) {
   picture.typeName.Clear();

@@ -75,9 +75,7 @@ struct JxrStream : WMPStream {
   void Connect();
 };
 
-ERR CloseNothing(WMPStream**) {
-  return WMP_errSuccess;
-}
+ERR CloseNothing(WMPStream**) { return WMP_errSuccess; }
 
 void JxrStream::Connect() {
   Close = CloseNothing;
@@ -122,34 +120,22 @@ SampleShape ShapeOf(const HdpStream& stream) {
   uint32_t bytes = 1;
   switch (stream.depth) {
     case HdpDepth::WhiteIsOne:
-    case HdpDepth::BlackIsOne:
-      return {stream.colors == HdpColors::Grey ? 1u : 0u, 0};
+    case HdpDepth::BlackIsOne: return {stream.colors == HdpColors::Grey ? 1u : 0u, 0};
     case HdpDepth::Rgb555:
-    case HdpDepth::Rgb565:
-      return {stream.colors == HdpColors::Rgb ? 1u : 0u, 2};
-    case HdpDepth::Rgb101010:
-      return {stream.colors == HdpColors::Rgb ? 1u : 0u, 4};
-    case HdpDepth::U8:
-      break;
+    case HdpDepth::Rgb565: return {stream.colors == HdpColors::Rgb ? 1u : 0u, 2};
+    case HdpDepth::Rgb101010: return {stream.colors == HdpColors::Rgb ? 1u : 0u, 4};
+    case HdpDepth::U8: break;
     case HdpDepth::U16:
     case HdpDepth::Fixed16:
-    case HdpDepth::Half:
-      bytes = 2;
-      break;
-    default:
-      bytes = 4;
-      break;
+    case HdpDepth::Half: bytes = 2; break;
+    default: bytes = 4; break;
   }
   switch (stream.colors) {
-    case HdpColors::Grey:
-      return {1, bytes};
-    case HdpColors::Rgb:
-      return {3, bytes};
+    case HdpColors::Grey: return {1, bytes};
+    case HdpColors::Rgb: return {3, bytes};
     case HdpColors::Rgbe:
-    case HdpColors::Cmyk:
-      return {bytes == 1 || (bytes == 2 && stream.colors == HdpColors::Cmyk) ? 4u : 0u, bytes};
-    default:
-      return {0, 0};
+    case HdpColors::Cmyk: return {bytes == 1 || (bytes == 2 && stream.colors == HdpColors::Cmyk) ? 4u : 0u, bytes};
+    default: return {0, 0};
   }
 }
 
@@ -213,13 +199,9 @@ Status MakeRaster(const HdpPage& page, HdpRaster& raster) {
 
 }  // namespace
 
-bool HasHdpLibrary() {
-  return Library().Whole();
-}
+bool HasHdpLibrary() { return Library().Whole(); }
 
-bool CanDecodeHdp(const HdpStream& stream) {
-  return ShapeOf(stream).samples > 0;
-}
+bool CanDecodeHdp(const HdpStream& stream) { return ShapeOf(stream).samples > 0; }
 
 Status DecodeHdp(const HdpPage& page, HdpRaster& raster, const std::function<void(int32_t)>& told) {
   if (!CanDecodeHdp(page.image)) return Status::UnsupportedFormat;
@@ -244,12 +226,9 @@ Status DecodeHdp(const HdpPage& page, HdpRaster& raster, const std::function<voi
   const platform::ApartResult result =
       platform::RunApart(work, kSecondsAtLeast + static_cast<unsigned>(pixels / kPixelsPerSecond), told);
   switch (result) {
-    case platform::ApartResult::Done:
-      return overrun.Bytes()[0] != 0 ? Status::FileReadError : Status::Ok;
-    case platform::ApartResult::NotStarted:
-      return Status::MemoryAllocationError;
-    default:
-      return overrun.Bytes()[0] != 0 ? Status::FileReadError : Status::DamagedFile;
+    case platform::ApartResult::Done: return overrun.Bytes()[0] != 0 ? Status::FileReadError : Status::Ok;
+    case platform::ApartResult::NotStarted: return Status::MemoryAllocationError;
+    default: return overrun.Bytes()[0] != 0 ? Status::FileReadError : Status::DamagedFile;
   }
 }
 

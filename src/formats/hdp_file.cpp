@@ -72,8 +72,7 @@ bool TakeTileSides(BitReader& bits, uint32_t count, unsigned width, uint32_t blo
 
 // The quantizers of one band; whether they change nothing.
 bool TakeQuantizers(BitReader& bits, uint32_t channels) {
-  const uint32_t mode =
-      channels > 1 ? bits.Take(2) : 0;  // one for all, one for luma and one for chroma, or each its own
+  const uint32_t mode = channels > 1 ? bits.Take(2) : 0;  // one for all, one for luma and one for chroma, or each its own
   const uint32_t count = mode == 0 ? 1 : mode == 1 ? 2 : channels;
   bool lossless = true;
   for (uint32_t i = 0; i < count; ++i) lossless = bits.Take(8) <= 1 && lossless;
@@ -94,14 +93,9 @@ void ParsePlane(BitReader& bits, HdpStream& stream) {
     case HdpDepth::U16:
     case HdpDepth::Fixed16:
     case HdpDepth::U32:
-    case HdpDepth::Fixed32:
-      bits.Take(8);
-      break;
-    case HdpDepth::Float:
-      bits.Take(16);
-      break;
-    default:
-      break;
+    case HdpDepth::Fixed32: bits.Take(8); break;
+    case HdpDepth::Float: bits.Take(16); break;
+    default: break;
   }
   bool lossless = bands == 0 && !scaled && bits.Flag() && TakeQuantizers(bits, channels);
   for (int band = 0; band < 2; ++band) {  // low and high frequencies, unless they use the quantizers before
@@ -170,8 +164,7 @@ Status ParseHdpStream(std::span<const uint8_t> data, HdpStream& stream) {
   ByteReader bytes(data);
   stream = {};
   stream.bytes = data;
-  if (!bytes.Match(std::string_view("WMPHOTO\0", 8)))
-    return data.size() < 8 ? Status::FileReadError : Status::DamagedFile;
+  if (!bytes.Match(std::string_view("WMPHOTO\0", 8))) return data.size() < 8 ? Status::FileReadError : Status::DamagedFile;
   BitReader bits(bytes);
   const uint32_t version = bits.Take(4), subversion = bits.Take(4);
   const bool tiled = bits.Flag();
@@ -193,8 +186,7 @@ Status ParseHdpStream(std::span<const uint8_t> data, HdpStream& stream) {
   const uint64_t height = uint64_t{bits.Take(shortNumbers ? 16 : 32)} + 1;
   const uint32_t columns = tiled ? bits.Take(12) + 1 : 1, rows = tiled ? bits.Take(12) + 1 : 1;
   if (!bytes.Ok()) return Status::FileReadError;
-  const bool known =
-      version == 1 && (subversion == 0 || subversion == 1 || subversion == 9) && overlap < 3 && !stretched;
+  const bool known = version == 1 && (subversion == 0 || subversion == 1 || subversion == 9) && overlap < 3 && !stretched;
   if (!known || !IsKnown(stream.colors, stream.depth)) return Status::UnsupportedFormat;
   if (width > INT32_MAX || height > INT32_MAX) return Status::DamagedFile;
   if (!indexed && (stream.frequencyOrder || columns * rows > 1)) return Status::DamagedFile;
@@ -212,9 +204,7 @@ Status ParseHdpStream(std::span<const uint8_t> data, HdpStream& stream) {
   return fit ? Status::Ok : Status::DamagedFile;
 }
 
-uint16_t OrientationOfTurn(uint32_t turn) {
-  return kOrientations[turn & 7];
-}
+uint16_t OrientationOfTurn(uint32_t turn) { return kOrientations[turn & 7]; }
 
 uint32_t HdpTurn(uint16_t orientation) {
   const auto found = std::find(std::begin(kOrientations), std::end(kOrientations), orientation);
@@ -250,41 +240,19 @@ Status ParseHdpPage(std::span<const uint8_t> file, int32_t page, HdpPage& result
     const HdpEntry entry = TakeEntry(bytes);
     switch (entry.tag) {
       case kHdpPixelFormat:
-        if (const auto guid = BytesOf(file, entry); guid.size() == 16)
-          std::memcpy(result.pixelFormat.data(), guid.data(), 16);
+        if (const auto guid = BytesOf(file, entry); guid.size() == 16) std::memcpy(result.pixelFormat.data(), guid.data(), 16);
         break;
-      case kHdpOrientation:
-        result.turn = entry.value & 7;
-        break;
-      case kHdpDpiX:
-        result.dpiX = std::bit_cast<float>(entry.value);
-        break;
-      case kHdpDpiY:
-        result.dpiY = std::bit_cast<float>(entry.value);
-        break;
-      case kHdpImageOffset:
-        image.offset = entry.value;
-        break;
-      case kHdpImageSize:
-        image.size = entry.value;
-        break;
-      case kHdpAlphaOffset:
-        alpha.offset = entry.value;
-        break;
-      case kHdpAlphaSize:
-        alpha.size = entry.value;
-        break;
-      case kHdpIcc:
-        result.icc = BytesOf(file, entry);
-        break;
-      case kHdpXmp:
-        result.xmp = BytesOf(file, entry);
-        break;
-      case kHdpDescription:
-        result.description = BytesOf(file, entry);
-        break;
-      default:
-        break;
+      case kHdpOrientation: result.turn = entry.value & 7; break;
+      case kHdpDpiX: result.dpiX = std::bit_cast<float>(entry.value); break;
+      case kHdpDpiY: result.dpiY = std::bit_cast<float>(entry.value); break;
+      case kHdpImageOffset: image.offset = entry.value; break;
+      case kHdpImageSize: image.size = entry.value; break;
+      case kHdpAlphaOffset: alpha.offset = entry.value; break;
+      case kHdpAlphaSize: alpha.size = entry.value; break;
+      case kHdpIcc: result.icc = BytesOf(file, entry); break;
+      case kHdpXmp: result.xmp = BytesOf(file, entry); break;
+      case kHdpDescription: result.description = BytesOf(file, entry); break;
+      default: break;
     }
   }
   if (!bytes.Ok()) return Status::FileReadError;

@@ -20,8 +20,7 @@ constexpr uint32_t kPixelFormatPlace = 8, kExifPlace = kPixelFormatPlace + 16;
 constexpr uint32_t kInFrequencyOrder = 1;  // of HDPWriteOptions
 
 // Pixel formats 8-bit grey and 24-bit blue, green, red: one name with a number at its end.
-constexpr uint8_t kPixelFormat[15] = {0x24, 0xC3, 0xDD, 0x6F, 0x03, 0x4E, 0xFE, 0x4B,
-                                      0xB1, 0x85, 0x3D, 0x77, 0x76, 0x8D, 0xC9};
+constexpr uint8_t kPixelFormat[15] = {0x24, 0xC3, 0xDD, 0x6F, 0x03, 0x4E, 0xFE, 0x4B, 0xB1, 0x85, 0x3D, 0x77, 0x76, 0x8D, 0xC9};
 constexpr uint8_t kGrey8 = 0x08, kBgr24 = 0x0C;
 
 // The file's directory, with blocks behind it, each at an even place.
@@ -62,8 +61,7 @@ class Directory {
   }
   // Where the value of a written entry lies in the file, for those that are known only later.
   uint64_t PlaceOf(uint16_t tag) const {
-    return std::find_if(entries_.begin(), entries_.end(), [tag](const Entry& entry) { return entry.tag == tag; })
-        ->place;
+    return std::find_if(entries_.begin(), entries_.end(), [tag](const Entry& entry) { return entry.tag == tag; })->place;
   }
 
  private:

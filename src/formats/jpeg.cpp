@@ -137,9 +137,7 @@ Status ReadHeader(JpegReader& reader, std::span<const uint8_t> file) {
 }
 
 bool IsGrey(const jpeg_decompress_struct& info) { return info.jpeg_color_space == JCS_GRAYSCALE; }
-bool IsCmyk(const jpeg_decompress_struct& info) {
-  return info.jpeg_color_space == JCS_CMYK || info.jpeg_color_space == JCS_YCCK;
-}
+bool IsCmyk(const jpeg_decompress_struct& info) { return info.jpeg_color_space == JCS_CMYK || info.jpeg_color_space == JCS_YCCK; }
 
 std::string_view DataOf(const jpeg_marker_struct& marker) {
   return {static_cast<const char*>(static_cast<const void*>(marker.data)), marker.data_length};
@@ -155,8 +153,8 @@ void JoinProfile(const jpeg_decompress_struct& info, std::vector<uint8_t>& profi
     bool found = false;
     for (jpeg_saved_marker_ptr marker = info.marker_list; marker != nullptr && !found; marker = marker->next) {
       const std::string_view data = DataOf(*marker);
-      found = marker->marker == kApp2 && data.starts_with(kIccHead) && data.size() > 14 &&
-              static_cast<uint8_t>(data[12]) == wanted;
+      found =
+          marker->marker == kApp2 && data.starts_with(kIccHead) && data.size() > 14 && static_cast<uint8_t>(data[12]) == wanted;
       if (found) Append(profile, data.substr(14));
     }
     if (!found) return;
@@ -284,7 +282,8 @@ void TakeLastBuffer(j_compress_ptr info) {
 bool HasGreyPalette(const PictureRecord& picture) {
   const size_t colors = static_cast<size_t>(picture.image.Colors());
   for (size_t i = 0; i < colors; ++i) {
-    if (picture.palette[3 * i] != picture.palette[3 * i + 1] || picture.palette[3 * i] != picture.palette[3 * i + 2]) return false;
+    if (picture.palette[3 * i] != picture.palette[3 * i + 1] || picture.palette[3 * i] != picture.palette[3 * i + 2])
+      return false;
   }
   return colors > 0;
 }
@@ -398,18 +397,12 @@ Status WriteAll(JpegWriter& writer, PictureRecord& picture, bool keep) {
 
 const char* ColorSpaceName(J_COLOR_SPACE space) {
   switch (space) {
-    case JCS_GRAYSCALE:
-      return "grey";
-    case JCS_RGB:
-      return "RGB";
-    case JCS_YCbCr:
-      return "YCbCr";
-    case JCS_CMYK:
-      return "CMYK";
-    case JCS_YCCK:
-      return "YCCK";
-    default:
-      return "unknown";
+    case JCS_GRAYSCALE: return "grey";
+    case JCS_RGB: return "RGB";
+    case JCS_YCbCr: return "YCbCr";
+    case JCS_CMYK: return "CMYK";
+    case JCS_YCCK: return "YCCK";
+    default: return "unknown";
   }
 }
 

@@ -224,8 +224,7 @@ void WriteHeader(ByteWriter& out, const PcxLayout& layout, const PictureRecord& 
 }
 
 // Takes the planes of a row apart, `bytesPerLine` bytes each, one after the other.
-using TakePlanes = void (*)(std::span<const uint8_t> row, int32_t width, const PcxLayout& layout,
-                            std::span<uint8_t> planes);
+using TakePlanes = void (*)(std::span<const uint8_t> row, int32_t width, const PcxLayout& layout, std::span<uint8_t> planes);
 
 void TakePlane(std::span<const uint8_t> row, int32_t, const PcxLayout&, std::span<uint8_t> planes) {
   std::copy_n(row.begin(), planes.size(), planes.begin());
@@ -248,8 +247,7 @@ void WriteLines(ByteWriter& out, const PcxLayout& layout, const PictureRecord& p
     picture.ReportRow(y);
     take(image.Row(y), image.Width(), layout, planes);
     for (size_t begin = 0; begin < planes.size(); begin += layout.bytesPerLine) {
-      out.Used(
-          EncodePcxPlane(planes.subspan(begin, layout.bytesPerLine), out.Reserve(2 * size_t{layout.bytesPerLine})));
+      out.Used(EncodePcxPlane(planes.subspan(begin, layout.bytesPerLine), out.Reserve(2 * size_t{layout.bytesPerLine})));
     }
   }
 }
@@ -274,8 +272,8 @@ Status PcxRead(PictureRecord& picture, const char* fileName) {
 
   PackedImage image;
   platform::MemoryBlock line;
-  RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette, picture.bitsPerPixel, image,
-                               platform::Fill::Unset));
+  RETURN_IF_BAD(
+      NewPackedImage(picture.width, picture.height, &picture.palette, picture.bitsPerPixel, image, platform::Fill::Unset));
   if (!line.Allocate(header.LineSize() + PcxLineDecoder::kSlack)) return Status::MemoryAllocationError;
   const SpreadRow spread = FindArrangement(header)->spread;
   const std::span<const uint8_t> decoded = line.Bytes().first(header.LineSize());

@@ -39,27 +39,17 @@ inline uint8_t* PutRun(uint8_t* to, size_t count, uint8_t value) {
 
 #ifdef BYTE_SHUFFLE
 
-BYTE_SHUFFLE __m128i Load(const uint8_t* bytes) {
-  return _mm_loadu_si128(reinterpret_cast<const __m128i*>(bytes));
-}
-BYTE_SHUFFLE __m128i Load8(const uint8_t* bytes) {
-  return _mm_loadl_epi64(reinterpret_cast<const __m128i*>(bytes));
-}
-BYTE_SHUFFLE void Store(uint8_t* bytes, __m128i value) {
-  _mm_storeu_si128(reinterpret_cast<__m128i*>(bytes), value);
-}
-BYTE_SHUFFLE void Store8(uint8_t* bytes, __m128i value) {
-  _mm_storel_epi64(reinterpret_cast<__m128i*>(bytes), value);
-}
+BYTE_SHUFFLE __m128i Load(const uint8_t* bytes) { return _mm_loadu_si128(reinterpret_cast<const __m128i*>(bytes)); }
+BYTE_SHUFFLE __m128i Load8(const uint8_t* bytes) { return _mm_loadl_epi64(reinterpret_cast<const __m128i*>(bytes)); }
+BYTE_SHUFFLE void Store(uint8_t* bytes, __m128i value) { _mm_storeu_si128(reinterpret_cast<__m128i*>(bytes), value); }
+BYTE_SHUFFLE void Store8(uint8_t* bytes, __m128i value) { _mm_storel_epi64(reinterpret_cast<__m128i*>(bytes), value); }
 
 // One bit for each of sixteen bytes: whether it is a mark, or equals another.
 BYTE_SHUFFLE uint32_t Marks(__m128i bytes) {
   const __m128i mark = _mm_set1_epi8(static_cast<char>(kMark));
   return static_cast<uint32_t>(_mm_movemask_epi8(_mm_cmpeq_epi8(_mm_max_epu8(bytes, mark), bytes)));
 }
-BYTE_SHUFFLE uint32_t Equal(__m128i a, __m128i b) {
-  return static_cast<uint32_t>(_mm_movemask_epi8(_mm_cmpeq_epi8(a, b)));
-}
+BYTE_SHUFFLE uint32_t Equal(__m128i a, __m128i b) { return static_cast<uint32_t>(_mm_movemask_epi8(_mm_cmpeq_epi8(a, b))); }
 
 using ShuffleTable = std::array<std::array<uint8_t, 16>, 256>;
 

@@ -99,9 +99,7 @@ PngLayout ChooseLayout(const PngReader& reader) {
   layout.height = static_cast<int32_t>(png_get_image_height(reader.png, reader.info));
   layout.interlaced = png_get_interlace_type(reader.png, reader.info) != PNG_INTERLACE_NONE;
   layout.bitsPerPixel = indexed && !transparent ? std::min<int32_t>(depth, 8) : 24;
-  layout.rows = transparent                  ? RowForm::WithAlpha
-                : layout.bitsPerPixel == 2   ? RowForm::TwoBits
-                                             : RowForm::Direct;
+  layout.rows = transparent ? RowForm::WithAlpha : layout.bitsPerPixel == 2 ? RowForm::TwoBits : RowForm::Direct;
   return layout;
 }
 
@@ -376,16 +374,11 @@ Status ReadPixels(PngReader& reader, const PngLayout& layout, PictureRecord& pic
 
 const char* ColorTypeName(png_byte type) {
   switch (type) {
-    case PNG_COLOR_TYPE_GRAY:
-      return "grey";
-    case PNG_COLOR_TYPE_PALETTE:
-      return "palette";
-    case PNG_COLOR_TYPE_RGB:
-      return "true color";
-    case PNG_COLOR_TYPE_GRAY_ALPHA:
-      return "grey with alpha";
-    default:
-      return "true color with alpha";
+    case PNG_COLOR_TYPE_GRAY: return "grey";
+    case PNG_COLOR_TYPE_PALETTE: return "palette";
+    case PNG_COLOR_TYPE_RGB: return "true color";
+    case PNG_COLOR_TYPE_GRAY_ALPHA: return "grey with alpha";
+    default: return "true color with alpha";
   }
 }
 

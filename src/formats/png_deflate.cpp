@@ -22,8 +22,7 @@ namespace fotomill {
 
 namespace {
 
-constexpr uint64_t kBandBytes = uint64_t{4}
-                                << 20;  // of filtered rows: large enough to cost nothing, small enough to share out
+constexpr uint64_t kBandBytes = uint64_t{4} << 20;  // of filtered rows: large enough to cost nothing, small enough to share out
 constexpr unsigned kMostThreads = 16;
 // The best level searches for the cheapest coding, which is 2 to 6 % smaller than zlib's best, in every other band: that
 // makes up for the bands between, which are up to 1 % larger than zlib's, and takes well below half of its time.
@@ -202,8 +201,7 @@ class BandQueue {
 };
 
 // One chunk, given in parts.
-void WriteChunk(ByteWriter& out, std::span<const uint8_t> head, std::span<const uint8_t> body,
-                std::span<const uint8_t> tail) {
+void WriteChunk(ByteWriter& out, std::span<const uint8_t> head, std::span<const uint8_t> body, std::span<const uint8_t> tail) {
   constexpr uint8_t kType[] = {'I', 'D', 'A', 'T'};
   uint32_t crc = libdeflate_crc32(0, kType, sizeof kType);
   out.Be32(static_cast<uint32_t>(head.size() + body.size() + tail.size()));

@@ -131,26 +131,13 @@ bool UndoPngFilter(uint8_t number, uint8_t* row, const uint8_t* above, size_t si
   if (filter == PngFilter::Up) UndoUp(row, above, size);
   if (filter == PngFilter::Paeth && UndoPaethFast(row, above, size, pixelBytes)) return true;
   switch (pixelBytes) {
-    case 1:
-      UndoOf<1>(filter, row, above, size);
-      return true;
-    case 2:
-      UndoOf<2>(filter, row, above, size);
-      return true;
-    case 3:
-      UndoOf<3>(filter, row, above, size);
-      return true;
-    case 4:
-      UndoOf<4>(filter, row, above, size);
-      return true;
-    case 6:
-      UndoOf<6>(filter, row, above, size);
-      return true;
-    case 8:
-      UndoOf<8>(filter, row, above, size);
-      return true;
-    default:
-      return false;
+    case 1: UndoOf<1>(filter, row, above, size); return true;
+    case 2: UndoOf<2>(filter, row, above, size); return true;
+    case 3: UndoOf<3>(filter, row, above, size); return true;
+    case 4: UndoOf<4>(filter, row, above, size); return true;
+    case 6: UndoOf<6>(filter, row, above, size); return true;
+    case 8: UndoOf<8>(filter, row, above, size); return true;
+    default: return false;
   }
 }
 

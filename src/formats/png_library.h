@@ -9,9 +9,7 @@ inline constexpr char kPngXmpKeyword[] = "XML:com.adobe.xmp";
 inline constexpr double kPngInchesPerMetre = 39.3701;
 
 // The library's errors end here: they are told by the status, never printed.
-[[noreturn]] inline void OnPngError(png_structp png, png_const_charp) {
-  png_longjmp(png, 1);
-}
+[[noreturn]] inline void OnPngError(png_structp png, png_const_charp) { png_longjmp(png, 1); }
 inline void OnPngWarning(png_structp, png_const_charp) {}
 
 // Runs library calls; false when one of them failed. Nothing with a destructor may live inside `action`.

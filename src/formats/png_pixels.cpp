@@ -67,11 +67,10 @@ bool PngPixels::Inflate(std::span<const uint8_t> file, uint64_t rowBytes, uint32
   std::span<const uint8_t> joined;
   const std::unique_ptr<libdeflate_decompressor, DecompressorDeleter> decompressor(libdeflate_alloc_decompressor());
   if (decompressor == nullptr || !Join(parts, packed, copy, joined)) return false;
-  if (!filtered_.Allocate(size + kPngSlack, platform::Fill::Unset) || !firstAbove_.Allocate(rowBytes + kPngSlack))
-    return false;
+  if (!filtered_.Allocate(size + kPngSlack, platform::Fill::Unset) || !firstAbove_.Allocate(rowBytes + kPngSlack)) return false;
   std::memset(filtered_.Data() + size, 0, kPngSlack);
-  return libdeflate_zlib_decompress(decompressor.get(), joined.data(), joined.size(), filtered_.Data(), size,
-                                    nullptr) == LIBDEFLATE_SUCCESS;
+  return libdeflate_zlib_decompress(decompressor.get(), joined.data(), joined.size(), filtered_.Data(), size, nullptr) ==
+         LIBDEFLATE_SUCCESS;
 }
 
 const uint8_t* PngPixels::NextRow() {

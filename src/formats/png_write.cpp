@@ -91,8 +91,7 @@ void SetHeader(const PngWriter& writer, const PictureRecord& picture) {
   const PackedImage& image = picture.image;
   const int type = ColorType(picture);
   png_set_IHDR(writer.png, writer.info, static_cast<png_uint_32>(image.Width()), static_cast<png_uint_32>(image.Height()),
-               DepthOf(picture), type, PNG_INTERLACE_NONE, PNG_COMPRESSION_TYPE_BASE,
-               PNG_FILTER_TYPE_BASE);
+               DepthOf(picture), type, PNG_INTERLACE_NONE, PNG_COMPRESSION_TYPE_BASE, PNG_FILTER_TYPE_BASE);
   if (type == PNG_COLOR_TYPE_PALETTE) {
     png_color colors[256];
     for (size_t i = 0; i < static_cast<size_t>(image.Colors()); ++i) {

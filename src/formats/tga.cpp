@@ -180,7 +180,9 @@ bool AttributeIsUseless(std::span<const uint8_t> file) {
 class RowSource {
  public:
   RowSource(ByteReader& bytes, const TgaHeader& header)
-      : bytes_(bytes), runLength_(header.runLength), pixelSize_(header.PixelSize()),
+      : bytes_(bytes),
+        runLength_(header.runLength),
+        pixelSize_(header.PixelSize()),
         row_(pixelSize_ * static_cast<uint64_t>(header.width)) {}
 
   // The next row; empty when the data are cut short. Valid until the next call.
@@ -265,14 +267,10 @@ RowReader ChooseRowReader(const TgaHeader& header) {
   if (header.type == kMapped) return ReadMapped;
   if (header.type == kGrey) return ReadGreyAlpha;
   switch (header.bits) {
-    case 15:
-      return ReadTrueColor<15>;
-    case 16:
-      return ReadTrueColor<16>;
-    case 24:
-      return CopyRow;
-    default:
-      return ReadTrueColor<32>;
+    case 15: return ReadTrueColor<15>;
+    case 16: return ReadTrueColor<16>;
+    case 24: return CopyRow;
+    default: return ReadTrueColor<32>;
   }
 }
 

@@ -55,12 +55,12 @@ struct TiffLayout {
   TiffSampleForm form;
   uint16_t samples = 1, colors = 1;  // of a pixel, and how many of them are colours
   uint16_t photometric = 0, compression = 0;
-  bool separate = false;             // each sample has strips or tiles of its own
+  bool separate = false;  // each sample has strips or tiles of its own
   bool tiled = false;
-  uint32_t bandHeight = 0;           // rows of a strip or tile
+  uint32_t bandHeight = 0;  // rows of a strip or tile
   uint32_t tileWidth = 0;
-  int alpha = -1;                    // the sample that is alpha
-  bool multiplied = false;           // colours were multiplied by alpha
+  int alpha = -1;           // the sample that is alpha
+  bool multiplied = false;  // colours were multiplied by alpha
   TiffRows rows = TiffRows::Library;
   int32_t bitsPerPixel = 24;
 };
@@ -87,18 +87,13 @@ void FindAlpha(TIFF* tiff, TiffLayout& layout) {
 
 uint16_t ColorsOf(TIFF* tiff, const TiffLayout& layout) {
   switch (layout.photometric) {
-    case PHOTOMETRIC_RGB:
-      return 3;
-    case PHOTOMETRIC_YCBCR:
-      return layout.compression == COMPRESSION_JPEG ? 3 : 0;
-    case PHOTOMETRIC_SEPARATED:
-      return Field<uint16_t>(tiff, TIFFTAG_INKSET) == INKSET_CMYK ? 4 : 0;
+    case PHOTOMETRIC_RGB: return 3;
+    case PHOTOMETRIC_YCBCR: return layout.compression == COMPRESSION_JPEG ? 3 : 0;
+    case PHOTOMETRIC_SEPARATED: return Field<uint16_t>(tiff, TIFFTAG_INKSET) == INKSET_CMYK ? 4 : 0;
     case PHOTOMETRIC_MINISBLACK:
     case PHOTOMETRIC_MINISWHITE:
-    case PHOTOMETRIC_PALETTE:
-      return 1;
-    default:
-      return 0;  // left to the library
+    case PHOTOMETRIC_PALETTE: return 1;
+    default: return 0;  // left to the library
   }
 }
 
@@ -158,7 +153,8 @@ void TakeColors(TIFF* tiff, size_t count, Palette& palette) {
   uint16_t* channels[3] = {};
   if (TIFFGetField(tiff, TIFFTAG_COLORMAP, &channels[0], &channels[1], &channels[2]) == 0) return;
   bool wide = false;
-  for (const uint16_t* channel : channels) wide = wide || std::any_of(channel, channel + count, [](uint16_t v) { return v > 255; });
+  for (const uint16_t* channel : channels)
+    wide = wide || std::any_of(channel, channel + count, [](uint16_t v) { return v > 255; });
   for (size_t i = 0; i < std::min<size_t>(count, 256); ++i) {
     for (size_t c = 0; c < 3; ++c) palette[3 * i + c] = static_cast<uint8_t>(wide ? channels[c][i] >> 8 : channels[c][i]);
   }
@@ -297,7 +293,8 @@ class TiffConverter {
       }
     } else if (layout_.colors == 4) {
       for (size_t x = 0; x < width; ++x, samples += step, image += 3) {
-        for (size_t i = 0; i < 3; ++i) image[i] = static_cast<uint8_t>(((255u - samples[2 - i]) * (255u - samples[3]) + 127) / 255);
+        for (size_t i = 0; i < 3; ++i)
+          image[i] = static_cast<uint8_t>(((255u - samples[2 - i]) * (255u - samples[3]) + 127) / 255);
       }
     } else {
       const bool indexed = layout_.photometric == PHOTOMETRIC_PALETTE;
@@ -329,8 +326,8 @@ class TiffConverter {
 
 // Whether rows can be taken from the strips without the library: whole bytes or less a sample, in the usual bit order.
 bool HasPlainStrips(TIFF* tiff, const TiffLayout& layout) {
-  return !layout.tiled && !layout.separate && layout.form.bits <= 8 && Field<uint16_t>(tiff, TIFFTAG_FILLORDER) == FILLORDER_MSB2LSB &&
-         (layout.photometric != PHOTOMETRIC_YCBCR);
+  return !layout.tiled && !layout.separate && layout.form.bits <= 8 &&
+         Field<uint16_t>(tiff, TIFFTAG_FILLORDER) == FILLORDER_MSB2LSB && (layout.photometric != PHOTOMETRIC_YCBCR);
 }
 
 // Uncompressed rows straight from the file, LZW through our own decoder, which is three times as fast as the library's. False,
@@ -356,7 +353,8 @@ bool ReadPlainStrips(TiffInput& input, const TiffLayout& layout, const PictureRe
     for (uint32_t r = 0; r < rows; ++r) {
       const uint64_t place = r * rowBytes;
       // Differences between neighbours are what the format's namesake in PNG has too.
-      if (differences && !UndoPngFilter(static_cast<uint8_t>(PngFilter::Sub), decoded + place, none.data(), rowBytes, layout.samples)) {
+      if (differences &&
+          !UndoPngFilter(static_cast<uint8_t>(PngFilter::Sub), decoded + place, none.data(), rowBytes, layout.samples)) {
         return false;
       }
       const auto y = static_cast<int32_t>(top + r);
@@ -421,9 +419,8 @@ class TiffBand {
     TIFF* tiff = input_.Handle();
     const auto sample = static_cast<uint16_t>(plane);
     const auto most = static_cast<tmsize_t>(pieceBytes_);
-    const tmsize_t read = layout_.tiled
-                              ? TIFFReadEncodedTile(tiff, TIFFComputeTile(tiff, x, y, 0, sample), piece_.Data(), most)
-                              : TIFFReadEncodedStrip(tiff, TIFFComputeStrip(tiff, y, sample), piece_.Data(), most);
+    const tmsize_t read = layout_.tiled ? TIFFReadEncodedTile(tiff, TIFFComputeTile(tiff, x, y, 0, sample), piece_.Data(), most)
+                                        : TIFFReadEncodedStrip(tiff, TIFFComputeStrip(tiff, y, sample), piece_.Data(), most);
     if (read < 0) return input_.Failure();
     const uint64_t left = x * bitsPerPixel_ / 8;
     const uint64_t count = std::min(pieceRow_, rowBytes_ - left);
@@ -494,8 +491,9 @@ Status ReadPixels(TiffInput& input, const TiffLayout& layout, PictureRecord& pic
   } else {
     TiffConverter converter(layout, picture.palette, target);
     const bool done = ReadPlainStrips(input, layout, picture, converter);
-    if (!done) RETURN_IF_BAD(layout.tiled || layout.separate ? ReadBands(input, layout, picture, converter)
-                                                  : ReadScanlines(input, layout, picture, converter));
+    if (!done)
+      RETURN_IF_BAD(layout.tiled || layout.separate ? ReadBands(input, layout, picture, converter)
+                                                    : ReadScanlines(input, layout, picture, converter));
   }
   picture.image = std::move(target.image);
   picture.alpha = std::move(target.alpha);

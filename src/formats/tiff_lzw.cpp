@@ -22,8 +22,7 @@ class CodeReader {
  public:
   explicit CodeReader(std::span<const uint8_t> source) : next_(source.data()), end_(source.data() + source.size()) {}
   uint32_t Take(unsigned width) {
-    if (end_ - next_ >=
-        8) {  // every time and without a look at what is there: cheaper than a branch that often goes wrong
+    if (end_ - next_ >= 8) {  // every time and without a look at what is there: cheaper than a branch that often goes wrong
       bits_ |= LoadBe64(next_) >> count_;
       next_ += (63 - count_) / 8;
       count_ |= 56;

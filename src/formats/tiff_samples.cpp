@@ -64,8 +64,7 @@ bool CanConvert(const TiffSampleForm& form) {
   return form.bits >= 1 && form.bits <= 32;
 }
 
-void ConvertSamples(const uint8_t* source, const TiffSampleForm& form, bool scaled, size_t count, uint8_t* target,
-                    size_t step) {
+void ConvertSamples(const uint8_t* source, const TiffSampleForm& form, bool scaled, size_t count, uint8_t* target, size_t step) {
   if (form.kind == TiffSampleForm::Float) {
     for (size_t i = 0; i < count; ++i) target[i * step] = FromReal(LoadReal(source, i, form.bits));
     return;

@@ -47,19 +47,14 @@ struct TiffPlan {
 
 uint16_t CompressionFor(const TiffPlan& plan, Greys greys) {
   switch (std::clamp<int32_t>(settings.TiffOptions, choice::kTiffNone, choice::kTiffJpeg)) {
-    case choice::kTiffNone:
-      return COMPRESSION_NONE;
-    case choice::kTiffPackBits:
-      return COMPRESSION_PACKBITS;
-    case choice::kTiffCcitt:
-      return plan.bits == 1 && greys != Greys::No ? COMPRESSION_CCITTFAX4 : COMPRESSION_LZW;
-    case choice::kTiffDeflate:
-      return COMPRESSION_ADOBE_DEFLATE;
+    case choice::kTiffNone: return COMPRESSION_NONE;
+    case choice::kTiffPackBits: return COMPRESSION_PACKBITS;
+    case choice::kTiffCcitt: return plan.bits == 1 && greys != Greys::No ? COMPRESSION_CCITTFAX4 : COMPRESSION_LZW;
+    case choice::kTiffDeflate: return COMPRESSION_ADOBE_DEFLATE;
     case choice::kTiffJpeg:
       return plan.bits == 8 && (plan.samples == 3 || (plan.samples == 1 && greys == Greys::Rising)) ? COMPRESSION_JPEG
-                                                                                                  : COMPRESSION_LZW;
-    default:
-      return COMPRESSION_LZW;
+                                                                                                    : COMPRESSION_LZW;
+    default: return COMPRESSION_LZW;
   }
 }
 
@@ -118,7 +113,8 @@ void SetLayout(TIFF* tiff, const PictureRecord& picture, const TiffPlan& plan) {
   uint64_t rows = std::max<uint64_t>(kStripBytes / rowBytes, 1);
   if (plan.compression == COMPRESSION_JPEG) rows = (rows + kJpegBlock - 1) / kJpegBlock * kJpegBlock;
   if (plan.compression == COMPRESSION_CCITTFAX4) rows = static_cast<uint64_t>(image.Height());
-  TIFFSetField(tiff, TIFFTAG_ROWSPERSTRIP, static_cast<uint32_t>(std::min<uint64_t>(rows, static_cast<uint64_t>(image.Height()))));
+  TIFFSetField(tiff, TIFFTAG_ROWSPERSTRIP,
+               static_cast<uint32_t>(std::min<uint64_t>(rows, static_cast<uint64_t>(image.Height()))));
 }
 
 // Tags of titles and ratings that the library does not know. Source: Microsoft, "Photo Metadata Policies".
@@ -179,7 +175,8 @@ void SetMetadata(TiffOutput& output, PictureRecord& picture, bool keep) {
   setBlock(TIFFTAG_XMLPACKET, metadata.xmp);
   const std::string comment(picture.comment.begin(), picture.comment.end());
   const char* described = nullptr;
-  if (!comment.empty() && TIFFGetField(tiff, TIFFTAG_IMAGEDESCRIPTION, &described) == 0) TIFFSetField(tiff, TIFFTAG_IMAGEDESCRIPTION, comment.c_str());
+  if (!comment.empty() && TIFFGetField(tiff, TIFFTAG_IMAGEDESCRIPTION, &described) == 0)
+    TIFFSetField(tiff, TIFFTAG_IMAGEDESCRIPTION, comment.c_str());
 }
 
 // A row as the file holds it. The library's predictor and byte orders work inside the buffer.

@@ -37,7 +37,7 @@ constexpr uint8_t kXmpFlag = 4, kExifFlag = 8, kAlphaFlag = 16, kIccFlag = 32;
 constexpr uint64_t kFileHead = 12, kFrameHead = 16;
 constexpr uint8_t kClearAfterwards = 1, kReplace = 2;  // flags of a frame: what becomes of it, and how it is put there
 constexpr size_t kMostFrames = 1 << 16;
-constexpr int kLossy = 1, kLossless = 2;               // WebPBitstreamFeatures::format
+constexpr int kLossy = 1, kLossless = 2;              // WebPBitstreamFeatures::format
 constexpr std::string_view kExifHead("Exif\0\0", 6);  // some programs put it in front, as in JPEG
 
 struct WebpFrame {
@@ -63,17 +63,12 @@ uint32_t Le24(ByteReader& bytes) {
 // What the library says of a stream of its own: chunks without the RIFF head, or a whole file.
 Status StatusOf(VP8StatusCode code) {
   switch (code) {
-    case VP8_STATUS_OK:
-      return Status::Ok;
-    case VP8_STATUS_OUT_OF_MEMORY:
-      return Status::MemoryAllocationError;
+    case VP8_STATUS_OK: return Status::Ok;
+    case VP8_STATUS_OUT_OF_MEMORY: return Status::MemoryAllocationError;
     case VP8_STATUS_NOT_ENOUGH_DATA:
-    case VP8_STATUS_SUSPENDED:
-      return Status::FileReadError;
-    case VP8_STATUS_UNSUPPORTED_FEATURE:
-      return Status::UnsupportedFormat;
-    default:
-      return Status::DamagedFile;
+    case VP8_STATUS_SUSPENDED: return Status::FileReadError;
+    case VP8_STATUS_UNSUPPORTED_FEATURE: return Status::UnsupportedFormat;
+    default: return Status::DamagedFile;
   }
 }
 
@@ -143,7 +138,7 @@ void Assign(std::vector<uint8_t>& block, std::span<const uint8_t> data) {
 }
 
 void Describe(const WebpFile& file, PictureRecord& picture) {
-  picture.typeName.AssignCut(file.frames.size() > 1      ? "Animated WebP"
+  picture.typeName.AssignCut(file.frames.size() > 1     ? "Animated WebP"
                              : file.format == kLossless ? "WebP, lossless"
                              : file.format == kLossy    ? "WebP, lossy"
                                                         : "WebP");
@@ -155,7 +150,8 @@ void Describe(const WebpFile& file, PictureRecord& picture) {
   picture.imageBytes = EstimateImageBytes(file.width, file.height, 24);
   MakeDefaultPalette(&picture.palette, nullptr, kDisplayPalette);
   picture.metadata = {};
-  const bool headed = file.exif.size() >= kExifHead.size() && std::memcmp(file.exif.data(), kExifHead.data(), kExifHead.size()) == 0;
+  const bool headed =
+      file.exif.size() >= kExifHead.size() && std::memcmp(file.exif.data(), kExifHead.data(), kExifHead.size()) == 0;
   Assign(picture.metadata.exif, headed ? file.exif.subspan(kExifHead.size()) : file.exif);
   Assign(picture.metadata.xmp, file.xmp);
   Assign(picture.metadata.icc, file.icc);
@@ -183,7 +179,8 @@ void PutRow(const uint8_t* source, int32_t width, bool replace, uint8_t* color, 
 
 void ClearFrame(const WebpFrame& frame, WebpTarget& target) {
   for (int32_t y = frame.top; y < frame.top + frame.height; ++y) {
-    std::fill_n(target.image.Row(y).data() + 3 * static_cast<size_t>(frame.left), 3 * static_cast<size_t>(frame.width), uint8_t{0});
+    std::fill_n(target.image.Row(y).data() + 3 * static_cast<size_t>(frame.left), 3 * static_cast<size_t>(frame.width),
+                uint8_t{0});
     std::fill_n(target.alpha.Row(y).data() + frame.left, frame.width, uint8_t{0});
   }
 }
@@ -277,7 +274,8 @@ Status Encode(const PictureRecord& picture, bool lossless, WebPMemoryWriter& enc
     picture.ReportRow(y);
   }
   if (WebPEncode(&config, &source) != 0) return Status::Ok;
-  const bool memory = source.error_code == VP8_ENC_ERROR_OUT_OF_MEMORY || source.error_code == VP8_ENC_ERROR_BITSTREAM_OUT_OF_MEMORY;
+  const bool memory =
+      source.error_code == VP8_ENC_ERROR_OUT_OF_MEMORY || source.error_code == VP8_ENC_ERROR_BITSTREAM_OUT_OF_MEMORY;
   return memory ? Status::MemoryAllocationError : Status::ErrorWritingFile;
 }
 

@@ -78,8 +78,8 @@ class XbmText {
     const char* const scanEnd = next_ + std::min(static_cast<uint64_t>(end_ - next_), limits.textScanBytes);
     while (next_ != scanEnd && *next_ != 'x') ++next_;
     if (end_ - next_ < 3 || next_ == scanEnd) return false;
-    value = static_cast<uint8_t>(kDigitValues[static_cast<uint8_t>(next_[1])] << 4 |
-                                 kDigitValues[static_cast<uint8_t>(next_[2])]);
+    value =
+        static_cast<uint8_t>(kDigitValues[static_cast<uint8_t>(next_[1])] << 4 | kDigitValues[static_cast<uint8_t>(next_[2])]);
     next_ += 3;
     return true;
   }
@@ -93,9 +93,7 @@ class XbmText {
   const char* start_;
 };
 
-bool Contains(std::string_view text, std::string_view word) {
-  return text.find(word) != std::string_view::npos;
-}
+bool Contains(std::string_view text, std::string_view word) { return text.find(word) != std::string_view::npos; }
 
 // The number behind the word that starts at `position`: past the next blank or tab and all that follow it.
 int64_t NumberBehind(std::string_view line, size_t position) {

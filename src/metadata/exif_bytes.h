@@ -67,19 +67,15 @@ inline constexpr uint64_t kExifLinkSize = 4;
 constexpr uint32_t ExifStoredSize(uint16_t type) {
   switch (type) {
     case kExifShort:
-    case kExifSShort:
-      return 2;
+    case kExifSShort: return 2;
     case kExifLong:
     case kExifSLong:
     case kTiffFloat:
-    case kTiffIfd:
-      return 4;
+    case kTiffIfd: return 4;
     case kExifRational:
     case kExifSRational:
-    case kTiffDouble:
-      return 8;
-    default:
-      return 1;
+    case kTiffDouble: return 8;
+    default: return 1;
   }
 }
 

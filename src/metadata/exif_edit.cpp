@@ -21,10 +21,10 @@ struct ThumbnailField {
   uint32_t number;
 };
 constexpr ThumbnailField kThumbnailFields[] = {
-    {0x0103, kExifShort, 6},        // compressed as JPEG
-    {0x011A, kExifRational, 0},     // both resolutions share one value behind the directory
+    {0x0103, kExifShort, 6},     // compressed as JPEG
+    {0x011A, kExifRational, 0},  // both resolutions share one value behind the directory
     {0x011B, kExifRational, 0},
-    {0x0128, kExifShort, 2},        // inches
+    {0x0128, kExifShort, 2},  // inches
     {kThumbnailOffsetTag, kExifLong, 0},
     {kThumbnailSizeTag, kExifLong, 0},
 };
@@ -97,13 +97,11 @@ void PutField(std::span<uint8_t> block, bool bigEndian, uint64_t entryOffset, ui
   Put32(block, bigEndian, entryOffset + 8, type == kExifShort && bigEndian ? number << 16 : number);
 }
 
-void SetField(std::span<uint8_t> bytes, const ExifBytes& block, const Directory& directory, uint16_t tag,
-              int32_t number) {
+void SetField(std::span<uint8_t> bytes, const ExifBytes& block, const Directory& directory, uint16_t tag, int32_t number) {
   const auto field = FindField(block, directory, tag);
   if (number <= 0 || !field) return;
   const bool asLong = number > 0xffff || (field->type == kExifLong && field->count == 1);
-  PutField(bytes, block.BigEndian(), field->entryOffset, asLong ? kExifLong : kExifShort,
-           static_cast<uint32_t>(number));
+  PutField(bytes, block.BigEndian(), field->entryOffset, asLong ? kExifLong : kExifShort, static_cast<uint32_t>(number));
 }
 
 // Adds the bytes of a directory and of the values that its entries keep elsewhere in the block.
@@ -218,8 +216,8 @@ void DropExifThumbnail(std::vector<uint8_t>& block) {
   JoinRanges(dropped);
   Put32(block, numbers.BigEndian(), first->LinkOffset(), 0);
   for (const Range& range : Difference(dropped, kept)) {
-    std::fill(block.begin() + static_cast<std::ptrdiff_t>(range.begin),
-              block.begin() + static_cast<std::ptrdiff_t>(range.end), uint8_t{0});
+    std::fill(block.begin() + static_cast<std::ptrdiff_t>(range.begin), block.begin() + static_cast<std::ptrdiff_t>(range.end),
+              uint8_t{0});
   }
   // Zeros that nothing refers to need not be kept: what is read beyond the end is zero anyway.
   size_t size = block.size();

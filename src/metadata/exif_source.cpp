@@ -17,8 +17,8 @@ namespace {
 constexpr uint64_t kHeadSize = 16 * 1024;  // holds the directories of most pictures; the rest is read when needed
 constexpr std::string_view kExifMark("Exif\0\0", 6);
 constexpr std::string_view kPngSignature("\x89PNG\r\n\x1a\n", 8);
-constexpr size_t kPngChunkSize = 12;       // of an empty chunk: length, type, checksum
-constexpr int kMostParts = 65536;          // segments or chunks that are passed by in search of the block
+constexpr size_t kPngChunkSize = 12;  // of an empty chunk: length, type, checksum
+constexpr int kMostParts = 65536;     // segments or chunks that are passed by in search of the block
 
 bool Starts(std::span<const uint8_t> bytes, std::string_view text) { return ByteReader(bytes).Match(text); }
 

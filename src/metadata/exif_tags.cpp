@@ -21,8 +21,7 @@ constexpr uint16_t kTrue[] = {'T'};
 constexpr uint16_t kResolutionUnits[] = {2, 3};
 constexpr uint16_t kCompressions[] = {1, 6};
 constexpr uint16_t kMeteringModes[] = {0, 1, 2, 3, 4, 5, 6, 255};
-constexpr uint16_t kLightSources[] = {0,  1,  2,  3,  4,  9,  10, 11, 12, 13, 14,
-                                      15, 17, 18, 19, 20, 21, 22, 23, 24, 255};
+constexpr uint16_t kLightSources[] = {0, 1, 2, 3, 4, 9, 10, 11, 12, 13, 14, 15, 17, 18, 19, 20, 21, 22, 23, 24, 255};
 constexpr uint16_t kColorSpaces[] = {0, 1};
 
 // Users know the lists as they stand, though some are not those of the standard: the orientations 3 and 4 carry each
@@ -223,9 +222,10 @@ consteval std::array<uint8_t, kSlotCount> MakeSlots() {
 }
 constexpr auto kSlots = MakeSlots();
 
-static_assert(std::ranges::all_of(kTags, [](const ExifTag& row) {
-                return (row.words != nullptr) == (row.rule == Words || row.rule == Components);
-              }),
+static_assert(std::ranges::all_of(kTags,
+                                  [](const ExifTag& row) {
+                                    return (row.words != nullptr) == (row.rule == Words || row.rule == Components);
+                                  }),
               "word lists go with the rules that read them");
 
 struct TypeFacts {
@@ -239,13 +239,9 @@ constexpr TypeFacts kTypes[] = {
 
 }  // namespace
 
-uint32_t ExifTypeSize(uint16_t type) {
-  return type >= kExifByte && type <= kExifSRational ? kTypes[type - 1].size : 1;
-}
+uint32_t ExifTypeSize(uint16_t type) { return type >= kExifByte && type <= kExifSRational ? kTypes[type - 1].size : 1; }
 
-std::string_view ExifTypeLabel(uint16_t type) {
-  return kTypes[std::clamp<int>(type, kExifByte, kExifSRational) - 1].label;
-}
+std::string_view ExifTypeLabel(uint16_t type) { return kTypes[std::clamp<int>(type, kExifByte, kExifSRational) - 1].label; }
 
 std::span<const ExifTag> ExifTags() { return kTags; }
 

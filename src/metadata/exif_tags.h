@@ -42,9 +42,9 @@ enum class ExifRule : uint8_t {
 
 // Which values a word list takes.
 enum class ExifWordKey : uint8_t {
-  Number,   // BYTE, SHORT or LONG
-  Opaque,   // those, or the first byte of UNDEFINED
-  Letter,   // the first character of ASCII
+  Number,  // BYTE, SHORT or LONG
+  Opaque,  // those, or the first byte of UNDEFINED
+  Letter,  // the first character of ASCII
 };
 
 // A word list: items separated by ";" and picked by index. Without `codes` the index is the value itself, with them it
@@ -60,15 +60,15 @@ struct ExifWordList {
 inline constexpr uint8_t kExifOrdinary = 0;
 inline constexpr uint8_t kExifStructural = 1;  // sizes, strips, offsets, colour layout: shown, not edited
 inline constexpr uint8_t kExifVersion = 2;
-inline constexpr uint8_t kExifOpaque = 7;      // pointers, maker notes, patterns
+inline constexpr uint8_t kExifOpaque = 7;  // pointers, maker notes, patterns
 
 // One row of the tag dictionary.
 struct ExifTag {
-  std::string_view name;       // as shown to the user
+  std::string_view name;  // as shown to the user
   uint16_t tag;
   uint8_t editClass;
-  int32_t minimum, maximum;    // accepted by the editor, both 0 when unbounded; rationals in thousandths
-  uint16_t type;               // in which the editor writes the value
+  int32_t minimum, maximum;  // accepted by the editor, both 0 when unbounded; rationals in thousandths
+  uint16_t type;             // in which the editor writes the value
   ExifRule rule;
   const ExifWordList* words = nullptr;  // for ExifRule::Words and Components
 };

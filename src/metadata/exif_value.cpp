@@ -38,9 +38,7 @@ void AddFixed(std::string& buffer, double number, int decimals) {
 
 struct Rational {
   int64_t numerator, denominator;
-  double Value() const {
-    return denominator == 0 ? 0.0 : static_cast<double>(numerator) / static_cast<double>(denominator);
-  }
+  double Value() const { return denominator == 0 ? 0.0 : static_cast<double>(numerator) / static_cast<double>(denominator); }
 };
 
 Rational RationalAt(const ExifValue& value, uint64_t index) {
@@ -52,18 +50,12 @@ Rational RationalAt(const ExifValue& value, uint64_t index) {
 // Value `index` of any whole-number type.
 int64_t NumberAt(const ExifValue& value, uint64_t index) {
   switch (value.type) {
-    case kExifShort:
-      return value.bytes.U16(2 * index);
-    case kExifSShort:
-      return static_cast<int16_t>(value.bytes.U16(2 * index));
-    case kExifLong:
-      return value.bytes.U32(4 * index);
-    case kExifSLong:
-      return static_cast<int32_t>(value.bytes.U32(4 * index));
-    case kExifSByte:
-      return static_cast<int8_t>(value.bytes.U8(index));
-    default:
-      return value.bytes.U8(index);
+    case kExifShort: return value.bytes.U16(2 * index);
+    case kExifSShort: return static_cast<int16_t>(value.bytes.U16(2 * index));
+    case kExifLong: return value.bytes.U32(4 * index);
+    case kExifSLong: return static_cast<int32_t>(value.bytes.U32(4 * index));
+    case kExifSByte: return static_cast<int8_t>(value.bytes.U8(index));
+    default: return value.bytes.U8(index);
   }
 }
 
@@ -91,9 +83,7 @@ void AddValue(std::string& buffer, const ExifValue& value, uint64_t index) {
   }
 }
 
-bool IsNumber(const ExifValue& value) {
-  return value.type == kExifByte || value.type == kExifShort || value.type == kExifLong;
-}
+bool IsNumber(const ExifValue& value) { return value.type == kExifByte || value.type == kExifShort || value.type == kExifLong; }
 bool IsRational(const ExifValue& value) { return value.type == kExifRational; }
 bool IsOpaque(const ExifValue& value) { return value.type == kExifUndefined; }
 
@@ -131,9 +121,8 @@ int64_t WordIndex(const ExifWordList& list, int64_t number) {
 }
 
 Text WordText(const ExifValue& value, const ExifWordList& list) {
-  const bool fits = list.key == ExifWordKey::Letter
-                        ? value.type == kExifAscii
-                        : IsNumber(value) || (list.key == ExifWordKey::Opaque && IsOpaque(value));
+  const bool fits = list.key == ExifWordKey::Letter ? value.type == kExifAscii
+                                                    : IsNumber(value) || (list.key == ExifWordKey::Opaque && IsOpaque(value));
   if (!fits || value.count == 0) return {};
   return ListItem(list.words, WordIndex(list, NumberAt(value, 0)));
 }
@@ -165,8 +154,8 @@ Text FlashText(const ExifValue& value, std::string& buffer) {
     int shift, mask;
   };
   static constexpr Field kFields[] = {
-      {"Fire: ", "N;Y", 0, 1},       {" Return: ", "X;U;N;D", 1, 3}, {" Mode: ", "U;F;S;A", 3, 3},
-      {" Function: ", "P;N", 5, 1},  {" Redeye: ", "N;Y", 6, 1},
+      {"Fire: ", "N;Y", 0, 1},      {" Return: ", "X;U;N;D", 1, 3}, {" Mode: ", "U;F;S;A", 3, 3},
+      {" Function: ", "P;N", 5, 1}, {" Redeye: ", "N;Y", 6, 1},
   };
   const int64_t bits = NumberAt(value, 0);
   for (const Field& field : kFields) {
@@ -202,8 +191,8 @@ Text SubjectLocationText(const ExifValue& value, std::string& buffer) {
 }
 
 Text LensText(const ExifValue& value, std::string& buffer) {
-  static constexpr std::string_view kTitles[] = {"Focal length minimum: ", "Focal length maximum: ", "F-stop minimum: ",
-                                                 "F-stop maximum: "};
+  static constexpr std::string_view kTitles[] = {
+      "Focal length minimum: ", "Focal length maximum: ", "F-stop minimum: ", "F-stop maximum: "};
   if (!IsRational(value) || value.count < std::size(kTitles)) return {};
   for (size_t i = 0; i < std::size(kTitles); ++i) {
     const Rational rational = RationalAt(value, i);
@@ -231,9 +220,7 @@ Text GpsTimeText(const ExifValue& value, std::string& buffer) {
   for (uint64_t i = 0; i < 3; ++i) {
     const Rational rational = RationalAt(value, i);
     if (i > 0) buffer += ':';
-    AddTwoDigits(buffer, rational.denominator == 0
-                             ? 0
-                             : static_cast<uint32_t>(rational.numerator / rational.denominator));
+    AddTwoDigits(buffer, rational.denominator == 0 ? 0 : static_cast<uint32_t>(rational.numerator / rational.denominator));
   }
   return buffer;
 }
@@ -247,29 +234,18 @@ Text CommentText(const ExifValue& value) {
 
 Text RuleText(const ExifValue& value, const ExifTag& row, std::string& buffer) {
   switch (row.rule) {
-    case ExifRule::Words:
-      return WordText(value, *row.words);
-    case ExifRule::Components:
-      return ComponentsText(value, *row.words, buffer);
-    case ExifRule::GpsVersion:
-      return GpsVersionText(value, buffer);
-    case ExifRule::Version:
-      return VersionText(value);
-    case ExifRule::Flash:
-      return FlashText(value, buffer);
-    case ExifRule::SubjectArea:
-      return SubjectAreaText(value, buffer);
-    case ExifRule::SubjectLocation:
-      return SubjectLocationText(value, buffer);
-    case ExifRule::Lens:
-      return LensText(value, buffer);
-    case ExifRule::Distance:
-      return DistanceText(value, buffer);
-    case ExifRule::GpsTime:
-      return GpsTimeText(value, buffer);
+    case ExifRule::Words: return WordText(value, *row.words);
+    case ExifRule::Components: return ComponentsText(value, *row.words, buffer);
+    case ExifRule::GpsVersion: return GpsVersionText(value, buffer);
+    case ExifRule::Version: return VersionText(value);
+    case ExifRule::Flash: return FlashText(value, buffer);
+    case ExifRule::SubjectArea: return SubjectAreaText(value, buffer);
+    case ExifRule::SubjectLocation: return SubjectLocationText(value, buffer);
+    case ExifRule::Lens: return LensText(value, buffer);
+    case ExifRule::Distance: return DistanceText(value, buffer);
+    case ExifRule::GpsTime: return GpsTimeText(value, buffer);
     case ExifRule::Plain:
-    case ExifRule::Comment:
-      break;
+    case ExifRule::Comment: break;
   }
   return {};
 }

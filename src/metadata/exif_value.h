@@ -39,7 +39,7 @@ struct ExifRawValue {
   bool bigEndian = false;  // "MM"
   uint16_t tag = 0;
   uint16_t type = 0;
-  uint32_t count = 0;      // as the entry claims; `data` holds what of it the block does
+  uint32_t count = 0;  // as the entry claims; `data` holds what of it the block does
   platform::MemoryBlock data;
 };
 // False, with `copy` empty, when there is no memory.

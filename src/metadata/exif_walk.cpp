@@ -107,11 +107,8 @@ class Walk {
       case kGpsPointerTag:
         if (findings.gpsOffset == 0) findings.gpsOffset = number;
         break;
-      case kThumbnailOffsetTag:
-        findings.thumbnailOffset = number;
-        break;
-      default:
-        findings.thumbnailSize = number;
+      case kThumbnailOffsetTag: findings.thumbnailOffset = number; break;
+      default: findings.thumbnailSize = number;
     }
   }
 
@@ -139,7 +136,7 @@ class Walk {
   uint32_t entries_ = 0;   // so far, of all directories
   bool listing_ = false;   // the directory being walked shows lines
   bool exifWalked_ = false, gpsWalked_ = false;
-  bool ended_ = false;     // a limit was met
+  bool ended_ = false;  // a limit was met
 };
 
 }  // namespace

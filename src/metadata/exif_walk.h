@@ -28,9 +28,9 @@ inline constexpr int32_t kAllExifDirectories = -1;
 
 // What a walk found beside its lines. Offsets are from the start of the block, 0 for none.
 struct ExifFindings {
-  uint32_t exifOffset = 0, gpsOffset = 0;   // the first of each that a directory points to
+  uint32_t exifOffset = 0, gpsOffset = 0;           // the first of each that a directory points to
   uint32_t thumbnailOffset = 0, thumbnailSize = 0;  // the last of each
-  bool cutShort = false;  // a limit ended the walk; the block may hold more
+  bool cutShort = false;                            // a limit ended the walk; the block may hold more
 };
 
 // Walks an EXIF block: the chain of directories from the header on, then the EXIF and the GPS directory that they point

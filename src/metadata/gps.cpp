@@ -62,8 +62,8 @@ double GpsDistance(double latitude1, double longitude1, double latitude2, double
   const double radius = settings.ExifDistinceUnits == 0 ? 3956 : 6367;
   const double alongLatitude = std::sin((latitude2 - latitude1) * kRadians / 2);
   const double alongLongitude = std::sin((longitude2 - longitude1) * kRadians / 2);
-  const double a = alongLatitude * alongLatitude + std::cos(latitude1 * kRadians) * std::cos(latitude2 * kRadians) *
-                                                       alongLongitude * alongLongitude;
+  const double a = alongLatitude * alongLatitude +
+                   std::cos(latitude1 * kRadians) * std::cos(latitude2 * kRadians) * alongLongitude * alongLongitude;
   const double part = std::clamp(a, 0.0, 1.0);  // rounding may leave the range where the places are opposite
   return radius * 2 * std::atan2(std::sqrt(part), std::sqrt(1 - part));
 }

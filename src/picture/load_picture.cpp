@@ -40,8 +40,7 @@ Status WritePicture(PictureRecord& picture, std::string_view destination, const 
   return WritePictureAs(picture, destination, FindFormatByName(destination), options);
 }
 
-Status WritePictureAs(PictureRecord& picture, std::string_view destination, int32_t formatIndex,
-                      const WriteOptions& options) {
+Status WritePictureAs(PictureRecord& picture, std::string_view destination, int32_t formatIndex, const WriteOptions& options) {
   if (formatIndex == kNoFormat) return Status::UnsupportedFormat;
   const FormatEntry& row = FormatRow(formatIndex);
   if (picture.bitsPerPixel > static_cast<int32_t>(row.maxBits)) return Status::TooManyColors;

@@ -19,12 +19,9 @@ int32_t PackedImage::PixelAt(int32_t x, int32_t y) const {
   if (x < 0 || y < 0 || x >= width_ || y >= height_) return -1;
   const uint8_t* row = Row(y).data();
   switch (bits_) {
-    case 1:
-      return row[x / 8] >> (7 - x % 8) & 1;
-    case 4:
-      return row[x / 2] >> (x % 2 == 0 ? 4 : 0) & 15;
-    case 8:
-      return row[x];
+    case 1: return row[x / 8] >> (7 - x % 8) & 1;
+    case 4: return row[x / 2] >> (x % 2 == 0 ? 4 : 0) & 15;
+    case 8: return row[x];
     default: {
       const uint8_t* pixel = row + 3 * static_cast<size_t>(x);
       return pixel[2] << 16 | pixel[1] << 8 | pixel[0];

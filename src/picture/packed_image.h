@@ -55,9 +55,7 @@ class PackedImage {
   std::span<uint8_t> Row(int32_t y) { return StoredRow(height_ - 1 - y); }
   std::span<const uint8_t> Row(int32_t y) const { return StoredRow(height_ - 1 - y); }
   std::span<uint8_t> StoredRow(int32_t r) { return Rows().subspan(static_cast<uint64_t>(r) * stride_, stride_); }
-  std::span<const uint8_t> StoredRow(int32_t r) const {
-    return Rows().subspan(static_cast<uint64_t>(r) * stride_, stride_);
-  }
+  std::span<const uint8_t> StoredRow(int32_t r) const { return Rows().subspan(static_cast<uint64_t>(r) * stride_, stride_); }
   // All rows in stored order.
   std::span<uint8_t> Rows() { return block_.Bytes().subspan(RowsOffset()); }
   std::span<const uint8_t> Rows() const { return block_.Bytes().subspan(RowsOffset()); }

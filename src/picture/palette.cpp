@@ -52,12 +52,11 @@ constexpr uint8_t kSevenSteps[] = {0, 0x2b, 0x55, 0x80, 0xaa, 0xd5, 0xff};
 constexpr uint8_t kEightSteps[] = {0, 0x24, 0x48, 0x6c, 0x90, 0xb4, 0xd8, 0xff};
 constexpr uint8_t kTwelveSteps[] = {0, 0x17, 0x2e, 0x46, 0x5d, 0x74, 0x8b, 0xa2, 0xb9, 0xd1, 0xe8, 0xff};
 
-constexpr Rgb kPrimaries[] = {{0, 0, 0},    {255, 0, 0},   {0, 255, 0},   {255, 255, 0},
-                              {0, 0, 255},  {255, 0, 255}, {0, 255, 255}, {255, 255, 255}};
-constexpr Rgb kVga[] = {{0, 0, 0},          {0x80, 0, 0},    {0, 0x80, 0},       {0x80, 0x80, 0},
-                        {0, 0, 0x80},       {0x80, 0, 0x80}, {0, 0x80, 0x80},    {0x80, 0x80, 0x80},
-                        {0xc0, 0xc0, 0xc0}, {255, 0, 0},     {0, 255, 0},        {255, 255, 0},
-                        {0, 0, 255},        {255, 0, 255},   {0, 255, 255},      {255, 255, 255}};
+constexpr Rgb kPrimaries[] = {{0, 0, 0},   {255, 0, 0},   {0, 255, 0},   {255, 255, 0},
+                              {0, 0, 255}, {255, 0, 255}, {0, 255, 255}, {255, 255, 255}};
+constexpr Rgb kVga[] = {{0, 0, 0},       {0x80, 0, 0},       {0, 0x80, 0},       {0x80, 0x80, 0}, {0, 0, 0x80}, {0x80, 0, 0x80},
+                        {0, 0x80, 0x80}, {0x80, 0x80, 0x80}, {0xc0, 0xc0, 0xc0}, {255, 0, 0},     {0, 255, 0},  {255, 255, 0},
+                        {0, 0, 255},     {255, 0, 255},      {0, 255, 255},      {255, 255, 255}};
 
 // `count` greys between black and white, neither of which is among them.
 void AddInnerGreys(PaletteFiller& filler, int32_t count) {
@@ -98,9 +97,7 @@ int32_t MakeDefaultPalette(Palette* palette, int32_t* depth, int32_t kind) {
       filler.AddCube(kFourSteps, kEightSteps, kFourSteps);
       kindDepth = 7;
       break;
-    case 6:
-      filler.AddCube(kSixSteps, kSixSteps, kSixSteps);
-      break;
+    case 6: filler.AddCube(kSixSteps, kSixSteps, kSixSteps); break;
     case 8:
       filler.AddCube(kSixSteps, kSixSteps, kSixSteps);
       AddInnerGreys(filler, 40);
@@ -109,9 +106,7 @@ int32_t MakeDefaultPalette(Palette* palette, int32_t* depth, int32_t kind) {
       filler.AddCube(kSevenSteps, kTwelveSteps, kThreeSteps);
       AddInnerGreys(filler, 4);
       break;
-    default:
-      filler.AddCube(kEightSteps, kEightSteps, kFourSteps);
-      break;
+    default: filler.AddCube(kEightSteps, kEightSteps, kFourSteps); break;
   }
   if (depth != nullptr) *depth = kindDepth;
   return filler.Count();

@@ -57,44 +57,44 @@ struct PictureMetadata {
 // The one in-memory form of a picture. `info` fills the facts, `read` the pixels; a writer or a viewer consumes both. The
 // record owns everything in it. On any failure of `read`, `image` and `alpha` stay empty.
 struct PictureRecord {
-  PathText fileName;          // the file being read or written
-  PathText workName;          // while writing: the name that `fileName` held before
-  FixedText<64> typeName;     // the variant that `info` found, such as "OS/2 bitmap"
-  int32_t width = 0;          // pixels
-  int32_t height = 0;         // rows
-  int32_t bitsPerPixel = 0;   // 1 to 8, or 24
-  platform::MemoryBlock metafile;     // the picture of a rendered format
+  PathText fileName;               // the file being read or written
+  PathText workName;               // while writing: the name that `fileName` held before
+  FixedText<64> typeName;          // the variant that `info` found, such as "OS/2 bitmap"
+  int32_t width = 0;               // pixels
+  int32_t height = 0;              // rows
+  int32_t bitsPerPixel = 0;        // 1 to 8, or 24
+  platform::MemoryBlock metafile;  // the picture of a rendered format
   platform::MemoryBlock extraBlock;
-  uint8_t metafileKind = 0;   // 128 or more: `metafile` is an enhanced one
-  Color defaultColour = 0xffffff;     // what alpha is flattened onto unless the record has its own background
-  uint64_t fileSize = 0;      // bytes, measured by `info`
-  uint64_t imageBytes = 0;    // estimate of the pixel data
+  uint8_t metafileKind = 0;        // 128 or more: `metafile` is an enhanced one
+  Color defaultColour = 0xffffff;  // what alpha is flattened onto unless the record has its own background
+  uint64_t fileSize = 0;           // bytes, measured by `info`
+  uint64_t imageBytes = 0;         // estimate of the pixel data
   Palette palette{};
-  void* window = nullptr;     // the face's window for which the record was made; not owned
-  PackedImage image;          // empty until `read` succeeds
-  int32_t formatIndex = -1;   // row of the registry, -1 none
-  void* context = nullptr;    // the job that asked for the picture; not owned
-  std::array<uint8_t, 256> remap{};   // colour translation, the identity at first
+  void* window = nullptr;            // the face's window for which the record was made; not owned
+  PackedImage image;                 // empty until `read` succeeds
+  int32_t formatIndex = -1;          // row of the registry, -1 none
+  void* context = nullptr;           // the job that asked for the picture; not owned
+  std::array<uint8_t, 256> remap{};  // colour translation, the identity at first
   DetailLines detailLines;
   platform::MemoryBlock auxBlock;
   platform::MemoryBlock extraBlock2;
-  PackedImage alpha;          // empty when the picture has none
-  Color background = 0;       // the record's own background
-  uint8_t alphaFlags = 0;     // kHasAlpha, kFlattenOnBackground
+  PackedImage alpha;       // empty when the picture has none
+  Color background = 0;    // the record's own background
+  uint8_t alphaFlags = 0;  // kHasAlpha, kFlattenOnBackground
 
   PictureMetadata metadata;
-  uint8_t lostMetadata = 0;           // kLost bits: what the last `write` could not keep
-  std::vector<uint8_t> comment;       // the file's comment text, UTF-8
-  FixedText<80> warning;      // a fault in the file that the decoder passed over; empty when there was none
-  int32_t pageCount = 1;      // pages or frames in the file
+  uint8_t lostMetadata = 0;            // kLost bits: what the last `write` could not keep
+  std::vector<uint8_t> comment;        // the file's comment text, UTF-8
+  FixedText<80> warning;               // a fault in the file that the decoder passed over; empty when there was none
+  int32_t pageCount = 1;               // pages or frames in the file
   int32_t hotSpotX = 0, hotSpotY = 0;  // of a cursor, pixels from the left and the top
-  int32_t page = 0;           // the page that `read` is to decode, from 0
-  int32_t thumbnailSide = 0;  // above 0: a decoder may deliver any smaller size that is still twice that of the largest
-                              // picture inside this square, which is what its longer edge decides; `width` and `height`
-                              // keep the full size, `image` tells its own
-  int32_t reduction = 1;      // how many pixels along each edge one of such an image stands for; the last column and row
-                              // may stand for fewer
-  ProgressSink* progress = nullptr;   // not owned, may be null
+  int32_t page = 0;                    // the page that `read` is to decode, from 0
+  int32_t thumbnailSide = 0;           // above 0: a decoder may deliver any smaller size that is still twice that of the largest
+                                       // picture inside this square, which is what its longer edge decides; `width` and `height`
+                                       // keep the full size, `image` tells its own
+  int32_t reduction = 1;               // how many pixels along each edge one of such an image stands for; the last column and row
+                                       // may stand for fewer
+  ProgressSink* progress = nullptr;    // not owned, may be null
 
   void ReportRow(int32_t done) const { ReportRow(done, height); }
   void ReportRow(int32_t done, int32_t total) const {

@@ -250,8 +250,7 @@ bool LacksLibrary(const FormatEntry& row) { return row.read == HdpRead && !HdpWo
 // A row matches an extension that equals its own, or that shares its first three characters; a shorter one must match
 // to its end.
 bool RowMatches(std::string_view rowExtension, std::string_view extension) {
-  return EqualIgnoringCase(extension, rowExtension) ||
-         EqualIgnoringCase(extension.substr(0, 3), rowExtension.substr(0, 3));
+  return EqualIgnoringCase(extension, rowExtension) || EqualIgnoringCase(extension.substr(0, 3), rowExtension.substr(0, 3));
 }
 
 }  // namespace

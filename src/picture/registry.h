@@ -14,10 +14,10 @@ namespace fotomill {
 
 // Capability bits of a format row.
 inline constexpr uint32_t FMT_BITMAP = 0x1;
-inline constexpr uint32_t FMT_RENDERED = 0x2;        // complete after `info`; `read` is never called
-inline constexpr uint32_t FMT_MULTI = 0x4;           // can hold more than one picture
+inline constexpr uint32_t FMT_RENDERED = 0x2;  // complete after `info`; `read` is never called
+inline constexpr uint32_t FMT_MULTI = 0x4;     // can hold more than one picture
 inline constexpr uint32_t FMT_ANIMATED = 0x8;
-inline constexpr uint32_t FMT_CLIPBOARD = 0x20;      // in no list and never matched by extension
+inline constexpr uint32_t FMT_CLIPBOARD = 0x20;  // in no list and never matched by extension
 inline constexpr uint32_t FMT_HIDDEN = 0x40;
 inline constexpr uint32_t FMT_PAGES = 0x100;
 inline constexpr uint32_t FMT_TIMED = 0x200;
@@ -27,16 +27,16 @@ inline constexpr uint32_t FMT_CONTAINER = 0x1000;
 inline constexpr uint32_t FMT_PNG = 0x2000;
 inline constexpr uint32_t FMT_SOUND = 0x4000;
 inline constexpr uint32_t FMT_LAYERED = 0x8000;
-inline constexpr uint32_t FMT_SECONDARY = 0x10000;   // left out of the destination list
-inline constexpr uint32_t FMT_NO_OPEN = 0x20000;     // left out of the open-file filter
+inline constexpr uint32_t FMT_SECONDARY = 0x10000;  // left out of the destination list
+inline constexpr uint32_t FMT_NO_OPEN = 0x20000;    // left out of the open-file filter
 inline constexpr uint32_t FMT_TRANSPARENT = 0x40000;
 inline constexpr uint32_t FMT_MEDIA = 0x80000;
 inline constexpr uint32_t FMT_MIDI = 0x100000;
-inline constexpr uint32_t FMT_SPARE = 0x200000;      // free slot for a plug-in format
+inline constexpr uint32_t FMT_SPARE = 0x200000;  // free slot for a plug-in format
 inline constexpr uint32_t FMT_FLASH = 0x400000;
 inline constexpr uint32_t FMT_ARCHIVE = 0x800000;
 inline constexpr uint32_t FMT_SAVE_ANYWAY = 0x1000000;  // in the destination list whatever else is set
-inline constexpr uint32_t FMT_ALPHA = 0x2000000;     // stores an alpha channel
+inline constexpr uint32_t FMT_ALPHA = 0x2000000;        // stores an alpha channel
 
 // Operations of a row. Codecs implement them as plain functions; none of them knows the registry.
 using DetailsOperation = Status (*)(PictureRecord& picture);  // fills `detailLines` of a record that `info` has filled
@@ -55,11 +55,11 @@ struct FormatEntry {
   LifeOperation startup = nullptr;
   LifeOperation shutdown = nullptr;
   uint32_t reserved = 0;
-  uint32_t maxBits = 0;          // deepest picture that `write` takes, bits per pixel
-  PathText extension;            // upper case, without the dot
-  PathText description;          // as shown to the user
-  int32_t enabled = 0;           // the user's switch, 1 or 0
-  uint32_t flags = 0;            // FMT_ bits
+  uint32_t maxBits = 0;                // deepest picture that `write` takes, bits per pixel
+  PathText extension;                  // upper case, without the dot
+  PathText description;                // as shown to the user
+  int32_t enabled = 0;                 // the user's switch, 1 or 0
+  uint32_t flags = 0;                  // FMT_ bits
   OptionsOperation options = nullptr;  // the row's override dialog, set by the desktop
 };
 
@@ -132,8 +132,7 @@ Status ReadPicture(PictureRecord& picture);
 // is flattened first. The picture stays the caller's.
 Status WritePicture(PictureRecord& picture, std::string_view destination, const WriteOptions& options);
 // The same to a given row.
-Status WritePictureAs(PictureRecord& picture, std::string_view destination, int32_t formatIndex,
-                      const WriteOptions& options);
+Status WritePictureAs(PictureRecord& picture, std::string_view destination, int32_t formatIndex, const WriteOptions& options);
 
 // The type name of a file for a browser's column, such as "(BMP) Windows bitmap", or "(XYZ) XYZ file".
 std::string DescribeFileType(std::string_view fileName);

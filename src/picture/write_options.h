@@ -12,8 +12,8 @@ namespace fotomill {
 // What the caller of a `write` operation decides beside the settings.
 struct WriteOptions {
   platform::Existing existing = platform::Existing::Replace;  // what to do about a file of the destination's name
-  bool keepMetadata = true;  // EXIF, XMP and ICC of the record go into formats that can hold them
-  std::string password;      // for formats that can be protected; empty: none
+  bool keepMetadata = true;       // EXIF, XMP and ICC of the record go into formats that can hold them
+  std::string password;           // for formats that can be protected; empty: none
   std::function<bool()> makeWay;  // called when the new file is whole, before it gets its name; false: it never does
 };
 
@@ -21,12 +21,9 @@ struct WriteOptions {
 // meanwhile and must not be replaced.
 constexpr Status CommitStatus(platform::CommitResult result) {
   switch (result) {
-    case platform::CommitResult::Done:
-      return Status::Ok;
-    case platform::CommitResult::Taken:
-      return Status::ErrorCreatingFile;
-    case platform::CommitResult::Failed:
-      break;
+    case platform::CommitResult::Done: return Status::Ok;
+    case platform::CommitResult::Taken: return Status::ErrorCreatingFile;
+    case platform::CommitResult::Failed: break;
   }
   return Status::ErrorWritingFile;
 }

@@ -19,8 +19,6 @@ int64_t Now() {
 
 void FixNow(int64_t seconds) { fixedNow = seconds; }
 
-double MonotonicSeconds() {
-  return std::chrono::duration<double>(std::chrono::steady_clock::now().time_since_epoch()).count();
-}
+double MonotonicSeconds() { return std::chrono::duration<double>(std::chrono::steady_clock::now().time_since_epoch()).count(); }
 
 }  // namespace fotomill::platform

@@ -44,10 +44,10 @@ class FileView {
   const uint8_t* data_ = nullptr;
   uint64_t size_ = 0;
   uint64_t fileSize_ = 0;
-  uint64_t dropped_ = 0;    // bytes given back so far, a multiple of the page size
-  void* mapping_ = nullptr; // set when mapped
-  intptr_t handle_ = -1;    // the open file
-  MemoryBlock copy_;        // holds the bytes when not mapped
+  uint64_t dropped_ = 0;     // bytes given back so far, a multiple of the page size
+  void* mapping_ = nullptr;  // set when mapped
+  intptr_t handle_ = -1;     // the open file
+  MemoryBlock copy_;         // holds the bytes when not mapped
 };
 
 }  // namespace fotomill::platform

@@ -17,15 +17,15 @@ struct FileFacts {
   FileKind kind = FileKind::Missing;
   uint64_t size = 0;
   int64_t modified = 0;
-  int64_t created = 0;   // the birth time where the file system keeps one, else the modification time
-  bool link = false;     // the name itself is a symbolic link
+  int64_t created = 0;                // the birth time where the file system keeps one, else the modification time
+  bool link = false;                  // the name itself is a symbolic link
   uint64_t device = 0, identity = 0;  // together they name the file itself, whatever its path
 };
 
 // Facts of the file that `path` leads to, through links. Missing is a kind, not an error. What cannot be asked (a folder on
 // the way may not be searched) is Other: nobody may take it for free.
 FileFacts FactsOf(const std::string& path);
-bool FileExists(const std::string& path);       // anything of that name, a dangling link included
+bool FileExists(const std::string& path);  // anything of that name, a dangling link included
 bool IsRegularFile(const std::string& path);
 bool IsFolder(const std::string& path);
 

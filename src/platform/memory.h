@@ -17,7 +17,8 @@ class MemoryBlock {
  public:
   MemoryBlock() = default;
   MemoryBlock(MemoryBlock&& other) noexcept
-      : data_(std::exchange(other.data_, nullptr)), size_(std::exchange(other.size_, 0)),
+      : data_(std::exchange(other.data_, nullptr)),
+        size_(std::exchange(other.size_, 0)),
         capacity_(std::exchange(other.capacity_, 0)) {}
   MemoryBlock& operator=(MemoryBlock&& other) noexcept;
   MemoryBlock(const MemoryBlock&) = delete;

@@ -22,7 +22,7 @@ std::string_view FileNameOf(std::string_view path);
 // The extension without its dot.
 std::string_view ExtensionOf(std::string_view path);
 
-extern const char kSeparator;           // '/' or '\\'
+extern const char kSeparator;            // '/' or '\\'
 extern const std::string_view kLineEnd;  // of text files: "\n" or "\r\n"
 
 }  // namespace fotomill::platform

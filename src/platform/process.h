@@ -21,8 +21,8 @@ bool IsStored(int stream);    // goes to a regular file: nobody waits for what i
 bool WaitForInput();
 // Whether what is typed on the terminal of the standard input shows up there. False when there is no such terminal.
 bool ShowTyping(bool show);
-int TerminalWidth();          // columns, 80 when unknown
-unsigned CoreCount();         // cores this process may use, at least 1
+int TerminalWidth();   // columns, 80 when unknown
+unsigned CoreCount();  // cores this process may use, at least 1
 
 // From here on Ctrl-C and the system's request to end are remembered instead of ending the program at once, and
 // `PendingExit` returns the exit status that belongs to them: 130 or 143, 0 while nothing was asked. A second request ends

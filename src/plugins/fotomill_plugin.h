@@ -47,16 +47,16 @@ extern "C" {
 #define FMW_ERROR_READ 3        /* the file ends too early */
 #define FMW_ERROR_UNSUPPORTED 5 /* this direction does not exist */
 #define FMW_ERROR_MEMORY 6
-#define FMW_ERROR_FORMAT 8      /* it is such a file, but of a variant that is not supported */
-#define FMW_ERROR_CREATE 10     /* the output file cannot be created */
+#define FMW_ERROR_FORMAT 8  /* it is such a file, but of a variant that is not supported */
+#define FMW_ERROR_CREATE 10 /* the output file cannot be created */
 #define FMW_ERROR_WRITE 11
 #define FMW_ERROR_COLORS 12     /* the picture is too deep */
 #define FMW_ERROR_UNSUITABLE 13 /* the format cannot hold such a picture */
 
 /* Format flags 2: what the formats of a module are. The program adds 0x200000 by itself. */
 #define FMW_FORMAT_BITMAP 0x1
-#define FMW_FORMAT_MULTI 0x4        /* files can hold more than one picture */
-#define FMW_FORMAT_ALPHA 0x2000000  /* the writer stores an alpha channel */
+#define FMW_FORMAT_MULTI 0x4       /* files can hold more than one picture */
+#define FMW_FORMAT_ALPHA 0x2000000 /* the writer stores an alpha channel */
 
 /*
  * A memory block that crosses the boundary. On Windows it is a movable global memory handle; elsewhere it is a pointer
@@ -68,16 +68,16 @@ typedef void* FMW_HANDLE;
 
 /* Filled by PLUGIN11GetPluginParams. The program clears it and sets size, version and instance. */
 typedef struct FMW_PLUGIN_PARAMS {
-  int32_t size;                     /*   0: 863 with 4-byte pointers, 867 with 8-byte ones */
-  int32_t version;                  /*   4 */
-  int32_t reserved;                 /*   8 */
-  char textA[FMW_TEXT_SIZE];        /*  12: the module's name, for the list of plug-ins */
-  char extensions[FMW_TEXT_SIZE];   /* 273: without dots, separated by ";": "pgm;ppm" */
-  char textB[FMW_TEXT_SIZE];        /* 534: the formats' description, shown behind "(EXT) Plugin" */
-  uint32_t flags1;                  /* 795: deepest picture that the writer takes, bits per pixel: 1, 8 or 24 */
-  uint32_t flags2;                  /* 799: FMW_FORMAT_ bits */
-  void* instance;                   /* 803: the program's module instance, 0 where there is no such thing */
-  uint8_t reserved2[56];            /* 807 */
+  int32_t size;                   /*   0: 863 with 4-byte pointers, 867 with 8-byte ones */
+  int32_t version;                /*   4 */
+  int32_t reserved;               /*   8 */
+  char textA[FMW_TEXT_SIZE];      /*  12: the module's name, for the list of plug-ins */
+  char extensions[FMW_TEXT_SIZE]; /* 273: without dots, separated by ";": "pgm;ppm" */
+  char textB[FMW_TEXT_SIZE];      /* 534: the formats' description, shown behind "(EXT) Plugin" */
+  uint32_t flags1;                /* 795: deepest picture that the writer takes, bits per pixel: 1, 8 or 24 */
+  uint32_t flags2;                /* 799: FMW_FORMAT_ bits */
+  void* instance;                 /* 803: the program's module instance, 0 where there is no such thing */
+  uint8_t reserved2[56];          /* 807 */
 } FMW_PLUGIN_PARAMS;
 
 /* A row of the program's configuration table: 20 bytes with 4-byte pointers, 32 with 8-byte ones. */
@@ -91,21 +91,21 @@ typedef struct FMW_CONFIG_ENTRY {
 
 /* What the program offers during a call. Valid for that call only. */
 typedef struct FMW_HOST_SERVICES {
-  int32_t size;                                                  /*  0: 64 with 4-byte pointers, 96 with 8-byte ones */
-  int32_t version;                                               /*  4 */
-  int32_t zero;                                                  /*  8 */
-  char mark[4];                                                  /* 12: "RXaR" */
-  uint8_t zero2[12];                                             /* 16 */
+  int32_t size;      /*  0: 64 with 4-byte pointers, 96 with 8-byte ones */
+  int32_t version;   /*  4 */
+  int32_t zero;      /*  8 */
+  char mark[4];      /* 12: "RXaR" */
+  uint8_t zero2[12]; /* 16 */
   /* Loads any picture that the program can read and returns it as a packed bitmap, or 0 with the error number set. */
   FMW_HANDLE(FMW_CALL* loadPicture)(const char* fileName, int32_t* error); /* 28 */
-  void(FMW_CALL* freePicture)(FMW_HANDLE bitmap);                /* 32: frees what loadPicture returned */
-  void(FMW_CALL* progressBegin)(void);                           /* 36 */
-  void(FMW_CALL* progressStep)(int32_t done, int32_t total);     /* 40 */
-  void(FMW_CALL* progressEnd)(void);                             /* 44 */
-  void(FMW_CALL* setStatus)(const char* text);                   /* 48: replaces the status text */
-  const FMW_CONFIG_ENTRY* configuration;                         /* 52: the configuration table; read only */
-  int32_t configurationCount;                                    /* 56: its rows */
-  const char* comment;                                           /* 60: in read calls the record's comment text, or 0 */
+  void(FMW_CALL* freePicture)(FMW_HANDLE bitmap);                          /* 32: frees what loadPicture returned */
+  void(FMW_CALL* progressBegin)(void);                                     /* 36 */
+  void(FMW_CALL* progressStep)(int32_t done, int32_t total);               /* 40 */
+  void(FMW_CALL* progressEnd)(void);                                       /* 44 */
+  void(FMW_CALL* setStatus)(const char* text);                             /* 48: replaces the status text */
+  const FMW_CONFIG_ENTRY* configuration;                                   /* 52: the configuration table; read only */
+  int32_t configurationCount;                                              /* 56: its rows */
+  const char* comment;                                                     /* 60: in read calls the record's comment text, or 0 */
 } FMW_HOST_SERVICES;
 
 /* Filled by PLUGIN11GetInfo. The program clears it and sets size, version and frame. */
@@ -146,8 +146,8 @@ typedef struct FMW_CONFIGURE {
  */
 
 /* The exports. Names are exact; results are non-zero on success unless said otherwise. */
-typedef const char*(FMW_CALL* FMW_GET_VERSION)(void);    /* PLUGIN11GetVersion: the module's own version text */
-typedef const char*(FMW_CALL* FMW_GET_COPYRIGHT)(void);  /* PLUGIN11GetCopyright */
+typedef const char*(FMW_CALL* FMW_GET_VERSION)(void);   /* PLUGIN11GetVersion: the module's own version text */
+typedef const char*(FMW_CALL* FMW_GET_COPYRIGHT)(void); /* PLUGIN11GetCopyright */
 /* PLUGIN11GetPluginParams: what the module serves. `zero` is 0. */
 typedef int32_t(FMW_CALL* FMW_GET_PARAMS)(FMW_PLUGIN_PARAMS* params, int32_t zero);
 /* PLUGIN11ReadImage: decodes a file; a packed bitmap, or 0 with the error number set. */

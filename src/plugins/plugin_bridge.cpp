@@ -120,8 +120,8 @@ Status CallWriter(const PluginEntry& entry, PictureRecord& picture, const std::s
   if (bitmap == nullptr) return Status::MemoryAllocationError;
   int32_t error = 0;
   ModuleCall call(picture);
-  const int32_t written = entry.exports.writeImage(path.c_str(), bitmap, comment.empty() ? nullptr : comment.c_str(),
-                                                   &error, call.Services());
+  const int32_t written =
+      entry.exports.writeImage(path.c_str(), bitmap, comment.empty() ? nullptr : comment.c_str(), &error, call.Services());
   platform::FreeModuleBlock(bitmap);
   if (written != 0) return Status::Ok;
   return error == 0 ? Status::ErrorWritingFile : static_cast<Status>(error);

@@ -32,8 +32,8 @@ std::vector<PluginFormatFacts> ListForRegistry() {
   std::vector<PluginFormatFacts> formats;
   for (int32_t i = 0; i < PluginFormatCount(); ++i) {
     const PluginEntry& entry = PluginRow(i);
-    formats.push_back({UpperCase(entry.extension.view()), std::string(entry.textB.view()), entry.flags1,
-                       entry.exports.writeImage != nullptr});
+    formats.push_back(
+        {UpperCase(entry.extension.view()), std::string(entry.textB.view()), entry.flags1, entry.exports.writeImage != nullptr});
   }
   return formats;
 }

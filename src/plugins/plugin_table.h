@@ -31,8 +31,8 @@ struct PluginEntry {
   PathText textA;          // the module's name
   void* module = nullptr;  // the loaded module; each entry holds its own load of it
   PluginExports exports;
-  uint32_t flags1 = 0;     // deepest picture that the writer takes, bits per pixel
-  uint32_t flags2 = 0;     // capability bits of the format row, always with FMT_SPARE
+  uint32_t flags1 = 0;  // deepest picture that the writer takes, bits per pixel
+  uint32_t flags2 = 0;  // capability bits of the format row, always with FMT_SPARE
 };
 static_assert(sizeof(void*) != 4 || sizeof(PluginEntry) == 1088);
 
@@ -76,8 +76,7 @@ void EnablePlugins(const std::string& folder = {});
 
 // Calls a row's own settings dialog, and remembers the row in `PluginConfigIndex`. False when the module offers none; the text to show then is kNothingToConfigure.
 bool ConfigurePlugin(int32_t index);
-inline constexpr std::string_view kNothingToConfigure =
-    "No configuration items are available for the selected plugin.";
+inline constexpr std::string_view kNothingToConfigure = "No configuration items are available for the selected plugin.";
 // The help page of a module beneath the program's folder: "html\NAME", with the system's separator.
 std::string PluginHelpPage(int32_t index);
 

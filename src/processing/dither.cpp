@@ -26,9 +26,7 @@ constexpr std::array<std::array<int32_t, 8>, 8> MakePattern() {
 constexpr auto kPattern = MakePattern();
 static_assert(kPattern[0][0] == 0 && kPattern[0][1] == 32 && kPattern[1][0] == 48 && kPattern[1][1] == 16);
 
-constexpr int32_t Clamp(int32_t value) {
-  return std::clamp(value, 0, 255);
-}
+constexpr int32_t Clamp(int32_t value) { return std::clamp(value, 0, 255); }
 
 }  // namespace
 

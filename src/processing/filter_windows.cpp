@@ -14,9 +14,7 @@ double Sinc(double x) {
   return std::sin(x) / x;
 }
 
-double Triangle(double x) {
-  return std::max(0.0, 1 - std::abs(x));
-}
+double Triangle(double x) { return std::max(0.0, 1 - std::abs(x)); }
 
 double Cubic(double x) {
   constexpr double a = -0.5;
@@ -26,9 +24,7 @@ double Cubic(double x) {
   return 0;
 }
 
-double Lanczos(double x) {
-  return std::abs(x) < 3 ? Sinc(x) * Sinc(x / 3) : 0;
-}
+double Lanczos(double x) { return std::abs(x) < 3 ? Sinc(x) * Sinc(x / 3) : 0; }
 
 struct FilterShape {
   double (*value)(double);
@@ -37,12 +33,9 @@ struct FilterShape {
 
 constexpr FilterShape ShapeOf(ScaleFilter filter) {
   switch (filter) {
-    case ScaleFilter::Bilinear:
-      return {Triangle, 1};
-    case ScaleFilter::Bicubic:
-      return {Cubic, 2};
-    default:
-      return {Lanczos, 3};
+    case ScaleFilter::Bilinear: return {Triangle, 1};
+    case ScaleFilter::Bicubic: return {Cubic, 2};
+    default: return {Lanczos, 3};
   }
 }
 
@@ -58,8 +51,7 @@ struct Plan {
     return std::clamp(static_cast<int32_t>(std::floor(Center(i) - shape.support * widen + 0.5)), 0, edge.count - 1);
   }
   int32_t End(int32_t i) const {
-    return std::clamp(static_cast<int32_t>(std::floor(Center(i) + shape.support * widen + 0.5)), First(i) + 1,
-                      edge.count);
+    return std::clamp(static_cast<int32_t>(std::floor(Center(i) + shape.support * widen + 0.5)), First(i) + 1, edge.count);
   }
   // The shares of the source pixels of window i, which add up to 1.
   void Shares(int32_t i, double* shares) const {

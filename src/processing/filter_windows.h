@@ -25,8 +25,8 @@ class FilterWindows {
 
   std::span<const FilterWindow> Windows() { return windows_.Items<FilterWindow>(); }
   const FilterWindow& Window(int32_t i) { return Windows()[static_cast<size_t>(i)]; }
-  int32_t Shift() const { return shift_; }          // the weights of a window add up to 2^shift
-  int32_t MostTaps() const { return mostTaps_; }    // of any window, zeros behind the last included
+  int32_t Shift() const { return shift_; }        // the weights of a window add up to 2^shift
+  int32_t MostTaps() const { return mostTaps_; }  // of any window, zeros behind the last included
 
  private:
   platform::MemoryBlock windows_, weights_;

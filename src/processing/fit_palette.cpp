@@ -89,8 +89,8 @@ bool Split(std::span<ColorBin> bins, Group& group, Group& other) {
 std::vector<Point> CutIntoGroups(std::span<ColorBin> bins, size_t colors) {
   std::vector<Group> groups{MakeGroup(bins, 0, bins.size())};
   while (groups.size() < colors) {
-    const auto worst = std::max_element(groups.begin(), groups.end(),
-                                        [](const Group& a, const Group& b) { return a.spread < b.spread; });
+    const auto worst =
+        std::max_element(groups.begin(), groups.end(), [](const Group& a, const Group& b) { return a.spread < b.spread; });
     if (worst->spread <= 0) break;
     Group other;
     if (Split(bins, *worst, other)) {
@@ -136,8 +136,7 @@ double MoveToMeans(std::span<const ColorBin> bins, NearestColor& nearest, ColorP
   for (size_t i = 0; i < static_cast<size_t>(points.count); ++i) {
     if (sums[i].weight <= 0) continue;
     for (size_t c = 0; c < 3; ++c) {
-      points.channel[i][c] =
-          static_cast<int32_t>(std::lround(sums[i].channel[c] / sums[i].weight * ColorPoints::kUnits));
+      points.channel[i][c] = static_cast<int32_t>(std::lround(sums[i].channel[c] / sums[i].weight * ColorPoints::kUnits));
     }
   }
   return error;

@@ -22,8 +22,7 @@ struct Background {
 
 void BlendBlock(uint8_t* bgr, const uint8_t* alpha, int32_t pixels, const Background& background) {
   if (std::all_of(alpha, alpha + pixels, [](uint8_t a) { return a == 255; })) return;
-  uint8_t
-      spread[3 * kAtOnce + 1];  // each alpha three times, so that the loop below sees bytes that do not differ in kind
+  uint8_t spread[3 * kAtOnce + 1];  // each alpha three times, so that the loop below sees bytes that do not differ in kind
   for (int32_t i = 0; i < pixels; ++i) {
     const uint32_t four = alpha[i] * 0x01010101u;
     std::memcpy(spread + 3 * i, &four, 4);

@@ -22,8 +22,8 @@ int32_t Distance(const Point& a, const Point& b) {
 // Whether colour j beats colour m at a point depends on the difference of the two distances, which is linear in the
 // point: at its most favourable corner it is the middle's difference less twice the weighed half width per channel
 // times how far the two colours lie apart there.
-int32_t PickCandidates(const ColorPoints& points, const uint8_t* from, int32_t count, const Point& corner,
-                       int32_t width, uint8_t* picked) {
+int32_t PickCandidates(const ColorPoints& points, const uint8_t* from, int32_t count, const Point& corner, int32_t width,
+                       uint8_t* picked) {
   const int32_t half = (width - 1) * ColorPoints::kUnits / 2;
   Point middle;
   for (size_t c = 0; c < 3; ++c) middle[c] = corner[c] * ColorPoints::kUnits + half;
@@ -60,8 +60,7 @@ Palette PaletteOf(const ColorPoints& points) {
   Palette palette{};
   for (size_t i = 0; i < static_cast<size_t>(points.count); ++i) {
     for (size_t c = 0; c < 3; ++c) {
-      palette[3 * i + 2 - c] =
-          static_cast<uint8_t>((points.channel[i][c] + ColorPoints::kUnits / 2) / ColorPoints::kUnits);
+      palette[3 * i + 2 - c] = static_cast<uint8_t>((points.channel[i][c] + ColorPoints::kUnits / 2) / ColorPoints::kUnits);
     }
   }
   return palette;
@@ -118,8 +117,7 @@ uint32_t NearestColor::FillFine(uint32_t cell) {
   const uint32_t blue = cell & 63, green = cell >> 6 & 63, red = cell >> 12;
   const uint8_t* coarse = CoarseList((red >> 2) << 8 | (green >> 2) << 4 | blue >> 2);
   uint8_t list[256 + 3];
-  const Point corner = {static_cast<int32_t>(blue) << 2, static_cast<int32_t>(green) << 2,
-                        static_cast<int32_t>(red) << 2};
+  const Point corner = {static_cast<int32_t>(blue) << 2, static_cast<int32_t>(green) << 2, static_cast<int32_t>(red) << 2};
   const int32_t count = PickCandidates(points_, coarse + 1, coarse[0] + 1, corner, 4, list);
   std::fill(list + count, list + 256 + 3, list[0]);
   return fine_[cell] = list[0] | (count > 1 ? StoreGroups(list, (static_cast<uint32_t>(count) + 3) / 4) << 8 : 0);

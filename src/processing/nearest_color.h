@@ -50,7 +50,7 @@ class NearestColor {
  private:
   static constexpr uint32_t kUnknown = 0xffffffff;
   static constexpr uint32_t kMostGroups = 200'000;  // 16 MB; beyond, cells do with their middle's nearest colour
-  static constexpr size_t kCoarseList = 257;  // a count, less one, and as many indices
+  static constexpr size_t kCoarseList = 257;        // a count, less one, and as many indices
 
   // Four colours of a fine cell's list. A colour's squared distance from a point, less what all colours have in common
   // there, is linear in the point: constant - factor x channel. Four times that, with the colour's place in the group

@@ -20,22 +20,14 @@ struct Turn {
 
 constexpr Turn TurnOf(Orientation orientation) {
   switch (orientation) {
-    case Orientation::MirrorAcross:
-      return {false, true, false};
-    case Orientation::HalfTurn:
-      return {false, true, true};
-    case Orientation::MirrorDown:
-      return {false, false, true};
-    case Orientation::Transpose:
-      return {true, false, false};
-    case Orientation::QuarterRight:
-      return {true, false, true};
-    case Orientation::Transverse:
-      return {true, true, true};
-    case Orientation::QuarterLeft:
-      return {true, true, false};
-    case Orientation::Upright:
-      break;
+    case Orientation::MirrorAcross: return {false, true, false};
+    case Orientation::HalfTurn: return {false, true, true};
+    case Orientation::MirrorDown: return {false, false, true};
+    case Orientation::Transpose: return {true, false, false};
+    case Orientation::QuarterRight: return {true, false, true};
+    case Orientation::Transverse: return {true, true, true};
+    case Orientation::QuarterLeft: return {true, true, false};
+    case Orientation::Upright: break;
   }
   return {false, false, false};
 }

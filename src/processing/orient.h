@@ -10,14 +10,14 @@ namespace fotomill {
 // How a stored picture must be turned to stand upright: the values of EXIF's Orientation tag (0x0112), which name where
 // the stored row 0 and column 0 belong.
 enum class Orientation : int32_t {
-  Upright = 1,         // top, left
-  MirrorAcross = 2,    // top, right: left and right change places
-  HalfTurn = 3,        // bottom, right
-  MirrorDown = 4,      // bottom, left: top and bottom change places
-  Transpose = 5,       // left, top: rows become columns
-  QuarterRight = 6,    // right, top: a quarter turn clockwise
-  Transverse = 7,      // right, bottom: mirrored about the other diagonal
-  QuarterLeft = 8,     // left, bottom: a quarter turn anticlockwise
+  Upright = 1,       // top, left
+  MirrorAcross = 2,  // top, right: left and right change places
+  HalfTurn = 3,      // bottom, right
+  MirrorDown = 4,    // bottom, left: top and bottom change places
+  Transpose = 5,     // left, top: rows become columns
+  QuarterRight = 6,  // right, top: a quarter turn clockwise
+  Transverse = 7,    // right, bottom: mirrored about the other diagonal
+  QuarterLeft = 8,   // left, bottom: a quarter turn anticlockwise
 };
 
 // Whether an orientation exchanges width and height.

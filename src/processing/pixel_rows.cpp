@@ -32,12 +32,8 @@ static_assert(GatherBits(kSpreadBits[0xA7]) == 0xA7);
 
 constexpr char kNone = -128;  // an index that gives 0
 
-BYTE_SHUFFLE __m128i Load(const uint8_t* bytes) {
-  return _mm_loadu_si128(reinterpret_cast<const __m128i*>(bytes));
-}
-BYTE_SHUFFLE void Store(uint8_t* bytes, __m128i value) {
-  _mm_storeu_si128(reinterpret_cast<__m128i*>(bytes), value);
-}
+BYTE_SHUFFLE __m128i Load(const uint8_t* bytes) { return _mm_loadu_si128(reinterpret_cast<const __m128i*>(bytes)); }
+BYTE_SHUFFLE void Store(uint8_t* bytes, __m128i value) { _mm_storeu_si128(reinterpret_cast<__m128i*>(bytes), value); }
 
 // Every third byte of 48, from byte `first` on: three registers, each shuffled to where its bytes belong.
 BYTE_SHUFFLE __m128i EveryThird(__m128i a, __m128i b, __m128i c, int first) {
@@ -90,8 +86,7 @@ BYTE_SHUFFLE __m128i Interleaved(__m128i blue, __m128i green, __m128i red, int p
   return _mm_or_si128(_mm_or_si128(fromBlue, fromGreen), fromRed);
 }
 
-BYTE_SHUFFLE size_t MergeColorsFast(const uint8_t* blue, const uint8_t* green, const uint8_t* red, size_t count,
-                                    uint8_t* bgr) {
+BYTE_SHUFFLE size_t MergeColorsFast(const uint8_t* blue, const uint8_t* green, const uint8_t* red, size_t count, uint8_t* bgr) {
   size_t x = 0;
   for (; x + 16 <= count; x += 16, bgr += 48) {
     const __m128i b = Load(blue + x), g = Load(green + x), r = Load(red + x);

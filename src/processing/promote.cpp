@@ -33,26 +33,19 @@ void ExpandRow(const uint8_t* packed, const uint8_t* colorTable, int32_t width, 
   std::memcpy(bgr, entry(width - 1), 3);
 }
 
-uint32_t ColorAt(const uint8_t* bgr) {
-  return static_cast<uint32_t>(bgr[2] << 16 | bgr[1] << 8 | bgr[0]);
-}
+uint32_t ColorAt(const uint8_t* bgr) { return static_cast<uint32_t>(bgr[2] << 16 | bgr[1] << 8 | bgr[0]); }
 
 int32_t Brightness(uint32_t color) {
   return static_cast<int32_t>(299 * (color >> 16) + 587 * (color >> 8 & 0xff) + 114 * (color & 0xff));
 }
 
-constexpr int32_t DepthForColors(int32_t colors) {
-  return colors <= 2 ? 1 : colors <= 16 ? 4 : 8;
-}
+constexpr int32_t DepthForColors(int32_t colors) { return colors <= 2 ? 1 : colors <= 16 ? 4 : 8; }
 
 }  // namespace
 
 Status BgrRows::Open(const PackedImage& image) {
   image_ = &image;
-  expand_ = image.Bits() == 1   ? ExpandRow<1>
-            : image.Bits() == 4 ? ExpandRow<4>
-            : image.Bits() == 8 ? ExpandRow<8>
-                                : nullptr;
+  expand_ = image.Bits() == 1 ? ExpandRow<1> : image.Bits() == 4 ? ExpandRow<4> : image.Bits() == 8 ? ExpandRow<8> : nullptr;
   if (expand_ == nullptr) return Status::Ok;
   const auto table = image.ColorTable();
   std::copy(table.begin(), table.end(), colors_.begin());

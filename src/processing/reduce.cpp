@@ -165,15 +165,9 @@ Status ReduceToMono(Reduction& work) {
   for (int32_t y = 0; y < height; ++y) {
     work.source.BrightnessRow(y, grey.Data());
     switch (work.options.monoDither) {
-      case Dither::None:
-        CutGreyRow(grey.Data(), width, threshold, work.indices.Data());
-        break;
-      case Dither::Ordered:
-        OrderGreyRow(grey.Data(), width, y, work.indices.Data());
-        break;
-      case Dither::FloydSteinberg:
-        diffuser.GreyRow(grey.Data(), work.indices.Data());
-        break;
+      case Dither::None: CutGreyRow(grey.Data(), width, threshold, work.indices.Data()); break;
+      case Dither::Ordered: OrderGreyRow(grey.Data(), width, y, work.indices.Data()); break;
+      case Dither::FloydSteinberg: diffuser.GreyRow(grey.Data(), work.indices.Data()); break;
     }
     work.StoreRow(y);
   }
@@ -230,30 +224,21 @@ Status ChoosePalette(Reduction& work, NearestColor& nearest) {
 
 Status ReduceToPalette(Reduction& work, NearestColor& nearest) {
   ErrorDiffuser diffuser;
-  RETURN_IF_BAD(
-      diffuser.Open(work.Width(), work.options.serpentine, work.colors <= kFew ? kHandedOnFew : kHandedOnMany));
+  RETURN_IF_BAD(diffuser.Open(work.Width(), work.options.serpentine, work.colors <= kFew ? kHandedOnFew : kHandedOnMany));
   const int32_t spacing = PaletteSpacing(work.palette, work.colors);
   for (int32_t y = 0; y < work.Height(); ++y) {
     const uint8_t* row = work.source.Row(y);
     switch (work.options.colorDither) {
-      case Dither::None:
-        MapRow(row, work.Width(), nearest, work.indices.Data());
-        break;
-      case Dither::Ordered:
-        OrderRow(row, work.Width(), y, spacing, nearest, work.indices.Data());
-        break;
-      case Dither::FloydSteinberg:
-        diffuser.Row(row, nearest, work.indices.Data());
-        break;
+      case Dither::None: MapRow(row, work.Width(), nearest, work.indices.Data()); break;
+      case Dither::Ordered: OrderRow(row, work.Width(), y, spacing, nearest, work.indices.Data()); break;
+      case Dither::FloydSteinberg: diffuser.Row(row, nearest, work.indices.Data()); break;
     }
     work.StoreRow(y);
   }
   return Status::Ok;
 }
 
-Dither DitherFromKey(int32_t value) {
-  return value == 0 ? Dither::None : value == 1 ? Dither::Ordered : Dither::FloydSteinberg;
-}
+Dither DitherFromKey(int32_t value) { return value == 0 ? Dither::None : value == 1 ? Dither::Ordered : Dither::FloydSteinberg; }
 
 }  // namespace
 
@@ -283,8 +268,7 @@ Status ReduceColors(PictureRecord& picture, int32_t maxBits, const ReduceOptions
   const ProgressScope progress(picture);
   Reduction work{picture, options, bits, {}, {}, {}};
   RETURN_IF_BAD(work.source.Open(picture.image, options));
-  if (!work.indices.Allocate(static_cast<uint64_t>(work.Width()), platform::Fill::Unset))
-    return Status::MemoryAllocationError;
+  if (!work.indices.Allocate(static_cast<uint64_t>(work.Width()), platform::Fill::Unset)) return Status::MemoryAllocationError;
   NearestColor nearest;
   if (bits == 1) {
     work.palette = EvenGreys(2);

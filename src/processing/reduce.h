@@ -18,13 +18,13 @@ enum class Dither : int32_t {
 struct ReduceOptions {
   Dither colorDither = Dither::FloydSteinberg;
   Dither monoDither = Dither::FloydSteinberg;
-  bool serpentine = true;   // Floyd-Steinberg takes every other row from right to left
-  bool greys = false;       // evenly spaced greys in place of a fitted palette
-  int32_t greyLevels = 0;   // with `greys`: number of greys, 2 to 256; 0 for as many as the depth holds
-  int32_t threshold = 0;    // 1 bit without dithering: the darkest brightness that becomes white, 1 to 255; 0: the
-                            // limit that parts the picture's brightnesses best (Otsu 1979)
-  int32_t brightness = 0;   // added before reducing to fewer colours than there are, -100 to 100 per cent of white
-  int32_t contrast = 0;     // spread about middle grey before that, -100 (all grey) to 100 per cent (doubled)
+  bool serpentine = true;  // Floyd-Steinberg takes every other row from right to left
+  bool greys = false;      // evenly spaced greys in place of a fitted palette
+  int32_t greyLevels = 0;  // with `greys`: number of greys, 2 to 256; 0 for as many as the depth holds
+  int32_t threshold = 0;   // 1 bit without dithering: the darkest brightness that becomes white, 1 to 255; 0: the
+                           // limit that parts the picture's brightnesses best (Otsu 1979)
+  int32_t brightness = 0;  // added before reducing to fewer colours than there are, -100 to 100 per cent of white
+  int32_t contrast = 0;    // spread about middle grey before that, -100 (all grey) to 100 per cent (doubled)
 };
 
 // The options that the configuration keys give: FXColorDither and FXMonoDither as above (other numbers as 2),

@@ -95,8 +95,7 @@ class SampleSource {
         for (int c = 0; c < channels; ++c) total[c] += sums[c];
       }
       const double share = 1.0 / (static_cast<double>(here) * rows);
-      for (int c = 0; c < channels; ++c)
-        averages[c] = static_cast<int16_t>(static_cast<double>(total[c]) * share + 0.5);
+      for (int c = 0; c < channels; ++c) averages[c] = static_cast<int16_t>(static_cast<double>(total[c]) * share + 0.5);
     }
   }
 
@@ -183,8 +182,7 @@ class Resampling {
       kernels_.weighBytes(rows, window, down_.Shift() - kFraction, stride_, row);
       return;
     }
-    for (const int32_t end = std::min(window.first + window.taps, lastRow_ + 1); filled_ < end; ++filled_)
-      Fill(filled_);
+    for (const int32_t end = std::min(window.first + window.taps, lastRow_ + 1); filled_ < end; ++filled_) Fill(filled_);
     const auto rows = RowsOf<int16_t>(window, [&](int32_t r) { return Slot(r); });
     kernels_.weighShorts(rows, window, down_.Shift(), stride_, row);
   }
@@ -223,8 +221,8 @@ class Resampling {
 
 }  // namespace
 
-Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Size size, ScaleFilter filter,
-                     PackedImage& scaled, PackedImage& scaledAlpha, ProgressSink* progress) {
+Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Size size, ScaleFilter filter, PackedImage& scaled,
+                     PackedImage& scaledAlpha, ProgressSink* progress) {
   const Reach all{static_cast<double>(image.Width()), static_cast<double>(image.Height())};
   return ScaleFiltered(image, alpha, all, size, filter, scaled, scaledAlpha, progress);
 }

@@ -9,13 +9,13 @@ namespace fotomill {
 // is a 16-bit share of 2^shift, and the weights of a window add up to 2^shift. A window's weights are filled up with
 // zeros to a whole number of kTapGroup.
 inline constexpr int32_t kTapGroup = 4;
-inline constexpr int32_t kFraction = 6;          // bits of a sample below one grey level
-inline constexpr int32_t kWeighedAtOnce = 64;    // samples: a row that is weighed has at least as many
+inline constexpr int32_t kFraction = 6;        // bits of a sample below one grey level
+inline constexpr int32_t kWeighedAtOnce = 64;  // samples: a row that is weighed has at least as many
 
 // The source pixels of each output pixel of a row or column.
 struct FilterWindow {
-  int32_t first;         // source pixel of the first weight
-  int32_t taps;          // weights, a multiple of kTapGroup
+  int32_t first;  // source pixel of the first weight
+  int32_t taps;   // weights, a multiple of kTapGroup
   const int16_t* weights;
 };
 

@@ -57,9 +57,7 @@ Size SizeAtPercentage(int32_t width, int32_t height, int32_t percentage) {
   return {AtPercentage(width, percentage), AtPercentage(height, percentage)};
 }
 
-ScaleFilter ScaleFilterFromKey(int32_t value) {
-  return kFilterOfKey[std::clamp<int32_t>(value, 0, std::size(kFilterOfKey) - 1)];
-}
+ScaleFilter ScaleFilterFromKey(int32_t value) { return kFilterOfKey[std::clamp<int32_t>(value, 0, std::size(kFilterOfKey) - 1)]; }
 
 Status ScaleNearest(const PackedImage& image, Size size, PackedImage& scaled) {
   scaled.Free();
@@ -103,8 +101,7 @@ Status ScaleNearest(const PackedImage& image, Size size, PackedImage& scaled) {
 
 Status ScalePictureByPercentage(PictureRecord& picture, int32_t percentage) {
   if (picture.image.Empty()) return Status::EmptyImage;
-  return ScalePicture(picture, SizeAtPercentage(picture.image.Width(), picture.image.Height(), percentage),
-                      ScaleFilter::Nearest);
+  return ScalePicture(picture, SizeAtPercentage(picture.image.Width(), picture.image.Height(), percentage), ScaleFilter::Nearest);
 }
 
 Status ScalePicture(PictureRecord& picture, Size size, ScaleFilter filter) {

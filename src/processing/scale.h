@@ -43,8 +43,8 @@ Status ScalePictureByPercentage(PictureRecord& picture, int32_t percentage);
 // size. The result has 24 bits (with Nearest the image's own depth) and an alpha plane when there was one. Shrinking by
 // 8 and more averages whole blocks of pixels first, so that a fourfold to eightfold reduction is left to the filter.
 // Re-entrant; the same on every processor. Statuses as NewPackedImage; on failure the results are empty.
-Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Size size, ScaleFilter filter,
-                     PackedImage& scaled, PackedImage& scaledAlpha, ProgressSink* progress = nullptr);
+Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Size size, ScaleFilter filter, PackedImage& scaled,
+                     PackedImage& scaledAlpha, ProgressSink* progress = nullptr);
 
 // The same of a picture that ends within the last column and row of its image, as a reduced decode leaves it.
 struct Reach {

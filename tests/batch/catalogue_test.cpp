@@ -35,17 +35,22 @@ TEST(CatalogueDrawing, FrameAndPicture) {
   const PicturePointer picture = MakePicture(96, 80, 24);
   for (const bool raised : {true, false}) {
     for (const bool black : {false, true}) {
-      const CatalogueLook look{.columns = 1, .rows = 1, .cellHeight = 80, .frame = raised ? CellFrame::Raised : CellFrame::Flat,
-                               .blackText = black, .names = false, .background = 0x302010};
+      const CatalogueLook look{.columns = 1,
+                               .rows = 1,
+                               .cellHeight = 80,
+                               .frame = raised ? CellFrame::Raised : CellFrame::Flat,
+                               .blackText = black,
+                               .names = false,
+                               .background = 0x302010};
       PackedImage page;
       ASSERT_EQ(NewCataloguePage(look, page), Status::Ok);
       DrawCell(look, 0, picture->image, {}, nullptr, page);
       const int32_t flat = black ? 0 : 0xA0A0A0, light = raised ? 0xFFFFFF : flat, dark = raised ? 0x404040 : flat;
       const struct {
         int32_t x, y, color;
-      } pixels[] = {{11, 11, 0x102030},  {12, 12, light},     {50, 12, light},     {12, 60, light},  {111, 60, dark},
-                    {50, 95, dark},      {111, 95, dark},     {112, 95, 0x102030}, {111, 96, 0x102030}, {13, 13, 0x102030},
-                    {14, 14, 0},         {109, 93, 0},        {110, 94, 0x102030}};
+      } pixels[] = {{11, 11, 0x102030}, {12, 12, light}, {50, 12, light},     {12, 60, light},     {111, 60, dark},
+                    {50, 95, dark},     {111, 95, dark}, {112, 95, 0x102030}, {111, 96, 0x102030}, {13, 13, 0x102030},
+                    {14, 14, 0},        {109, 93, 0},    {110, 94, 0x102030}};
       for (const auto& pixel : pixels) EXPECT_EQ(page.PixelAt(pixel.x, pixel.y), pixel.color) << pixel.x << "," << pixel.y;
     }
   }

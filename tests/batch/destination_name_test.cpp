@@ -32,9 +32,7 @@ class ScriptedPrompts : public Prompts {
   std::optional<std::string> AskPassword(const std::string&) override { return std::nullopt; }
   bool ConfirmFormat(const std::string&) override { return true; }
   bool ConfirmNewFolder(const std::string&) override { return true; }
-  void StoreFlag(KeyNumber key, bool value) override {
-    stored.push_back(std::string(KeyOf(key).name) + (value ? "=1" : "=0"));
-  }
+  void StoreFlag(KeyNumber key, bool value) override { stored.push_back(std::string(KeyOf(key).name) + (value ? "=1" : "=0")); }
 };
 
 int32_t RowOf(std::string_view extension) { return FindFormatByName("x." + std::string(extension)); }
@@ -59,9 +57,8 @@ TEST(DestinationName, ExtensionsFollowTheSourcesCase) {
     const char *format, *source;
     const char* styles[3];
   } rows[] = {
-      {"TIF", "Jpg", {"Tif", "TIF", "tif"}}, {"JPEG", "BMP", {"JPEg", "JPEg", "jpeg"}},
-      {"PCX", "bmp", {"pcx", "PCX", "pcx"}}, {"MP3", "PNG", {"MP3", "MP3", "mp3"}},
-      {"PCX", "", {"pcx", "pcx", "pcx"}},    {"PCX", "7Zx", {"pCx", "pCX", "pcx"}},
+      {"TIF", "Jpg", {"Tif", "TIF", "tif"}}, {"JPEG", "BMP", {"JPEg", "JPEg", "jpeg"}}, {"PCX", "bmp", {"pcx", "PCX", "pcx"}},
+      {"MP3", "PNG", {"MP3", "MP3", "mp3"}}, {"PCX", "", {"pcx", "pcx", "pcx"}},        {"PCX", "7Zx", {"pCx", "pCX", "pcx"}},
   };
   for (const auto& row : rows) {
     for (int32_t style = 0; style < 3; ++style) {
@@ -116,12 +113,27 @@ TEST(DestinationName, WhatBecomesOfATakenName) {
       {"replaced", {}, false, true, {{true, replace, "a", false}}, "!a.tif", 1, {"OverwriteKeepBoth=0"}},
       {"renamed", {.keepBoth = false}, false, true, {{true, replace, "new", false}}, "new.tif", 1},
       {"renamed to a taken one, then cancelled", {.keepBoth = false}, false, true, {{true, replace, "b", false}}, "skipped", 2},
-      {"renamed to a taken one, for all", {.keepBoth = false}, false, true,
-       {{true, {.keepBoth = false, .applyToRest = true}, "b", false}}, "!b.tif", 1},
-      {"a name that leads elsewhere", {.keepBoth = false}, false, true,
-       {{true, replace, "../b", false}, {true, replace, "", false}, {true, replace, "c", false}}, "c.tif", 3},
-      {"never again, into the bin", {.keepBoth = false}, false, true,
-       {{true, {.notify = false, .keepBoth = false, .recycle = true, .previews = false}, "a", false}}, "!~a.tif", 1,
+      {"renamed to a taken one, for all",
+       {.keepBoth = false},
+       false,
+       true,
+       {{true, {.keepBoth = false, .applyToRest = true}, "b", false}},
+       "!b.tif",
+       1},
+      {"a name that leads elsewhere",
+       {.keepBoth = false},
+       false,
+       true,
+       {{true, replace, "../b", false}, {true, replace, "", false}, {true, replace, "c", false}},
+       "c.tif",
+       3},
+      {"never again, into the bin",
+       {.keepBoth = false},
+       false,
+       true,
+       {{true, {.notify = false, .keepBoth = false, .recycle = true, .previews = false}, "a", false}},
+       "!~a.tif",
+       1,
        {"PromptBeforeOverwrite=0", "OverwritePromptRecycle=1", "OverwritePromptPreviews=0"}},
   };
   for (const auto& row : rows) {
@@ -170,7 +182,11 @@ TEST(DestinationName, TypedNamesAndVariants) {
   const struct {
     int32_t first, last;
     const char* outcome;
-  } rows[] = {{2, 1, "no variant"}, {1, 2, "no variant"}, {1, 3, "a [3].tif"}, {-1, INT32_MAX, "a [-1].tif"}, {INT32_MAX, INT32_MAX, "a [2147483647].tif"}};
+  } rows[] = {{2, 1, "no variant"},
+              {1, 2, "no variant"},
+              {1, 3, "a [3].tif"},
+              {-1, INT32_MAX, "a [-1].tif"},
+              {INT32_MAX, INT32_MAX, "a [2147483647].tif"}};
   for (const auto& row : rows) {
     job.naming.firstVariant = row.first;
     job.naming.lastVariant = row.last;

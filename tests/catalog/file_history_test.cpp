@@ -43,7 +43,9 @@ class FileHistory : public testing::Test {
     return path;
   }
   std::string Store() const { return folder_.Path("data/FMWFileHistoryDatabase.fhdb"); }
-  std::string Line(const std::string& name, const std::string& rest) const { return "\tPATH:" + folder_.Path(name) + rest + "\n"; }
+  std::string Line(const std::string& name, const std::string& rest) const {
+    return "\tPATH:" + folder_.Path(name) + rest + "\n";
+  }
   // "NAME FUNCTION ACCESSED" of each entry in list order, with the times before now.
   std::vector<std::string> List() const {
     std::vector<std::string> list;

@@ -40,7 +40,8 @@ class Database : public testing::Test {
     ThumbnailDatabase database;
     DatabaseHeader header;
     std::vector<std::string> records;
-    if (database.OpenThumbnailDatabase(Path(), false) != Opened::Done || !database.ReadDatabaseHeader(header)) return {"unreadable"};
+    if (database.OpenThumbnailDatabase(Path(), false) != Opened::Done || !database.ReadDatabaseHeader(header))
+      return {"unreadable"};
     for (int64_t i = 0; i < database.RecordCount(header); ++i) {
       DatabaseRecord record;
       if (!database.ReadDatabaseRecord(i, record)) return {"broken"};
@@ -61,7 +62,8 @@ DatabaseRecord Record(const std::string& path, const std::string& volume, uint8_
   return record;
 }
 
-bool Append(ThumbnailDatabase& database, const std::string& path, const std::string& volume, uint8_t pixel, bool replace = false) {
+bool Append(ThumbnailDatabase& database, const std::string& path, const std::string& volume, uint8_t pixel,
+            bool replace = false) {
   const DatabaseRecord record = Record(path, volume, pixel);
   return database.AppendDatabaseRecords({&record, 1}, replace);
 }
@@ -167,8 +169,8 @@ TEST_F(Database, FindsWhatAScanFinds) {
     ThumbnailDatabase fresh;
     ASSERT_EQ(fresh.OpenThumbnailDatabase(Path(), false), Opened::Done);
     ThumbnailRecord found;
-    const auto wanted = std::ranges::find_if(
-        model, [&](const Row& row) { return !row.deleted && row.path == path && row.volume == volume; });
+    const auto wanted =
+        std::ranges::find_if(model, [&](const Row& row) { return !row.deleted && row.path == path && row.volume == volume; });
     ASSERT_EQ(fresh.Find(path, volume, found), wanted != model.end());
     if (wanted != model.end()) {
       ASSERT_EQ(found.bytes[300], wanted->pixel);
@@ -183,7 +185,8 @@ TEST_F(Database, FindsWhatAScanFinds) {
 TEST_F(Database, ComparesExtensionsAsItIsTold) {
   ThumbnailDatabase database;
   ASSERT_EQ(database.OpenThumbnailDatabase(Path(), true), Opened::Done);
-  ASSERT_TRUE(Append(database, "/p.x/a.jpg", "v", 1) && Append(database, "/p.x/a.png", "w", 2) && Append(database, "/p.x/a.png", "v", 3));
+  ASSERT_TRUE(Append(database, "/p.x/a.jpg", "v", 1) && Append(database, "/p.x/a.png", "w", 2) &&
+              Append(database, "/p.x/a.png", "v", 3));
   ThumbnailRecord found;
   EXPECT_FALSE(database.Find("/p.x/a.gif", "v", found));
   ASSERT_TRUE(database.Find("/p.x/a.png", "v", found));
@@ -214,7 +217,9 @@ TEST_F(Database, ASavedIndexIsOnlyAHelp) {
   const auto finds = [&](int number) {
     ThumbnailDatabase database;
     ThumbnailRecord found;
-    const auto find = [&] { return database.Find("/p/" + std::to_string(number), "v", found) && found.bytes[300] == number % 256; };
+    const auto find = [&] {
+      return database.Find("/p/" + std::to_string(number), "v", found) && found.bytes[300] == number % 256;
+    };
     if (!open(database)) return false;
     const bool inFile = find();  // the second time with all of it loaded
     EXPECT_EQ(find(), inFile);
@@ -342,8 +347,8 @@ TEST_F(Database, PurgesOnlyWhereItCanTell) {
     std::string label;
     bool purged;
   } rows[] = {
-      {"fixed", platform::DriveKind::Fixed, "v", true},     {"unknown", platform::DriveKind::Unknown, "v", true},
-      {"network", platform::DriveKind::Network, "v", false}, {"optical", platform::DriveKind::Optical, "v", false},
+      {"fixed", platform::DriveKind::Fixed, "v", true},          {"unknown", platform::DriveKind::Unknown, "v", true},
+      {"network", platform::DriveKind::Network, "v", false},     {"optical", platform::DriveKind::Optical, "v", false},
       {"removable", platform::DriveKind::Removable, "v", false}, {"another volume", platform::DriveKind::Fixed, "w", false},
   };
   WriteText(folder_.Path("there"), "");
@@ -390,7 +395,8 @@ TEST_F(Database, FaultsLoseNoRecord) {
   faults = ForEachFault([&] {
     WriteBytes(Path(), start);
     ThumbnailDatabase odd;
-    const bool done = odd.OpenThumbnailDatabase(Path(), false) == Opened::Done && odd.CompactThumbnailDatabase(false) == Compacted::Done;
+    const bool done =
+        odd.OpenThumbnailDatabase(Path(), false) == Opened::Done && odd.CompactThumbnailDatabase(false) == Compacted::Done;
     const int64_t left = platform::faultCountdown.exchange(0);
     if (done) {
       EXPECT_THAT(Records(), ElementsAre("/a v 1"));

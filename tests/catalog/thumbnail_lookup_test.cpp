@@ -124,7 +124,8 @@ TEST(SystemThumbnail, IsNamedAfterThePicture) {
   EXPECT_EQ(FileUri("/a b#%\xc3\xa4[;]!~(1)'&.j"), "file:///a%20b%23%25%C3%A4%5B%3B%5D!~(1)'&.j");
   std::string digits;
   for (int i = 0; i < 8; ++i) digits += "1234567890";
-  EXPECT_EQ(Md5Text(std::span(reinterpret_cast<const uint8_t*>(digits.data()), digits.size())), "57edf4a22be3c955ac49da2e2107b67a");
+  EXPECT_EQ(Md5Text(std::span(reinterpret_cast<const uint8_t*>(digits.data()), digits.size())),
+            "57edf4a22be3c955ac49da2e2107b67a");
   EXPECT_EQ(Md5Text({}), "d41d8cd98f00b204e9800998ecf8427e");
 }
 
@@ -144,17 +145,20 @@ class Lookup : public testing::Test {
     InsertText(file, std::string("Thumb::URI") + '\0' + uri);
     InsertText(file, std::string("Thumb::MTime") + '\0' + std::to_string(facts.st_mtime + late));
     const std::string name = FileUri(picture_);
-    WriteBytes(folder_.Path("cache/thumbnails/large/" + Md5Text({reinterpret_cast<const uint8_t*>(name.data()), name.size()}) + ".png"), file);
+    WriteBytes(
+        folder_.Path("cache/thumbnails/large/" + Md5Text({reinterpret_cast<const uint8_t*>(name.data()), name.size()}) + ".png"),
+        file);
   }
   static void InsertText(std::vector<uint8_t>& file, const std::string& text) {
     std::string chunk = "tEXt" + text;
     const auto number = [](uint32_t value) {
-      return std::vector<uint8_t>{static_cast<uint8_t>(value >> 24), static_cast<uint8_t>(value >> 16), static_cast<uint8_t>(value >> 8),
-                                  static_cast<uint8_t>(value)};
+      return std::vector<uint8_t>{static_cast<uint8_t>(value >> 24), static_cast<uint8_t>(value >> 16),
+                                  static_cast<uint8_t>(value >> 8), static_cast<uint8_t>(value)};
     };
     std::vector<uint8_t> bytes = number(static_cast<uint32_t>(text.size()));
     bytes.insert(bytes.end(), chunk.begin(), chunk.end());
-    const std::vector<uint8_t> crc = number(static_cast<uint32_t>(crc32(0, reinterpret_cast<const Bytef*>(chunk.data()), static_cast<uInt>(chunk.size()))));
+    const std::vector<uint8_t> crc =
+        number(static_cast<uint32_t>(crc32(0, reinterpret_cast<const Bytef*>(chunk.data()), static_cast<uInt>(chunk.size()))));
     bytes.insert(bytes.end(), crc.begin(), crc.end());
     file.insert(file.begin() + 33, bytes.begin(), bytes.end());  // behind the header chunk
   }
@@ -229,7 +233,8 @@ TEST_F(Lookup, AsksWhereTheModeSays) {
     ASSERT_TRUE(!row.hasFile || WriteThumbnailFile(file, ThumbnailPathFor(picture_)));
     settings.AlwaysUseTHN = row.alwaysFile;
     settings.UseWindowsThumbnailCache = row.useCache;
-    ThumbnailSources sources{row.mode, true, [&](std::string_view name) { return name == "a b.bmp" ? &listed : nullptr; }, &database};
+    ThumbnailSources sources{row.mode, true, [&](std::string_view name) { return name == "a b.bmp" ? &listed : nullptr; },
+                             &database};
     const auto record = std::make_unique<AnyThumbnailRecord>();
     ASSERT_EQ(LookUpThumbnail(picture_, row.large, sources, *record), row.found != kNone);
     const bool large = std::holds_alternative<LargeThumbnailRecord>(*record);

@@ -48,9 +48,9 @@ TEST(ThumbnailRecord, IsLaidOutToTheByte) {
   ThumbnailRecord record;
   ASSERT_TRUE(MakeThumbnailRecord(record, *Plain(10, 20, 1, 2, 3)));
   std::vector<uint8_t> wanted = Hex("54 48 4E 4C   # THNL\n 00 02  # version 512");
-  wanted.resize(264);                                // reserved
+  wanted.resize(264);                                                            // reserved
   for (int i = 0; i < 24; ++i) wanted.insert(wanted.end(), {0x33, 0x22, 0x11});  // blue, green, red of the matte
-  wanted.insert(wanted.end(), {1, 2, 3});            // the picture, 48 x 96, from column 24 on
+  wanted.insert(wanted.end(), {1, 2, 3});                                        // the picture, 48 x 96, from column 24 on
   EXPECT_EQ(Head(record, wanted.size()), wanted);
 }
 
@@ -112,7 +112,8 @@ TEST(ThumbnailRecord, IsTheSameFromAReducedDecode) {
   ASSERT_EQ(MakeThumbnailOfFile(folder.Path("a.jpg"), reduced), Status::Ok);
   ASSERT_TRUE(MakeThumbnailRecord(full, *picture));
   int largest = 0;
-  for (size_t i = kThumbnailHeaderSize; i < full.bytes.size(); ++i) largest = std::max(largest, std::abs(full.bytes[i] - reduced.bytes[i]));
+  for (size_t i = kThumbnailHeaderSize; i < full.bytes.size(); ++i)
+    largest = std::max(largest, std::abs(full.bytes[i] - reduced.bytes[i]));
   EXPECT_LE(largest, 8);
 }
 
@@ -156,16 +157,11 @@ TEST(ThumbnailFile, ReadsNewAndOldRecords) {
     size_t size;
     bool reads, old;
   } rows[] = {
-      {"new", "THNL", 512, 27912, true, false},
-      {"version 2", "THNL", 2, 27912, true, false},
-      {"version 1", "THNL", 1, 27912, true, true},
-      {"negative version", "THNL", -1, 27912, true, true},
-      {"old", "THNL", 1, 264 + 9216, true, true},
-      {"short", "THNL", 512, 27911, true, true},
-      {"longer", "THNL", 512, 30000, true, false},
-      {"large", "tHNL", 512, 27912, false, false},
-      {"foreign", "\x89PNG", 512, 27912, false, false},
-      {"three bytes", "THNL", 512, 3, false, false},
+      {"new", "THNL", 512, 27912, true, false},         {"version 2", "THNL", 2, 27912, true, false},
+      {"version 1", "THNL", 1, 27912, true, true},      {"negative version", "THNL", -1, 27912, true, true},
+      {"old", "THNL", 1, 264 + 9216, true, true},       {"short", "THNL", 512, 27911, true, true},
+      {"longer", "THNL", 512, 30000, true, false},      {"large", "tHNL", 512, 27912, false, false},
+      {"foreign", "\x89PNG", 512, 27912, false, false}, {"three bytes", "THNL", 512, 3, false, false},
       {"empty", "THNL", 512, 0, false, false},
   };
   for (const auto& row : rows) {
@@ -262,12 +258,15 @@ TEST_F(ThumbsCommand, MakesWhatIsMissingAndCleansWhatIsLeft) {
   ASSERT_EQ(elements.size(), 4u);
   EXPECT_EQ(elements[0]["made"], false);
   EXPECT_EQ(elements[0]["status"], 0);
-  EXPECT_EQ(elements[2], (json{{"file", In("bad.bmp")}, {"thumbnail", In("bad.THN")}, {"made", false}, {"status", 2}, {"message", "Damaged file."}}));
+  EXPECT_EQ(
+      elements[2],
+      (json{
+          {"file", In("bad.bmp")}, {"thumbnail", In("bad.THN")}, {"made", false}, {"status", 2}, {"message", "Damaged file."}}));
 
   EXPECT_EQ(RunCommand({"thumbs", "clean", In(""), "-n"}).out, In("gone.thn") + "\n");
   EXPECT_EQ(RunCommand({"thumbs", "clean", In("")}).status, 0);
-  EXPECT_THAT(folder_.Names(), ElementsAre(".dot.THN", "a.THN", "a.bmp", "b.THN", "b.bmp", "bad.bmp", "c.THN", "c.bmp",
-                                           "folder.THN", "link.THN"));
+  EXPECT_THAT(folder_.Names(),
+              ElementsAre(".dot.THN", "a.THN", "a.bmp", "b.THN", "b.bmp", "bad.bmp", "c.THN", "c.bmp", "folder.THN", "link.THN"));
   EXPECT_EQ(RunCommand({"thumbs", "clean", In("nothere")}).status, 1);
 }
 
@@ -291,7 +290,8 @@ TEST_F(ThumbsCommand, ShowsAThumbnailAsAPicture) {
   EXPECT_TRUE(std::equal(picture.begin() + 54, picture.end(), record.begin() + 264, record.end()));
   EXPECT_EQ(RunCommand({"thumbs", "show", In("a.THN"), "--out", In("t.bmp")}).status, 1);
   EXPECT_EQ(RunCommand({"thumbs", "show", In("a.THN"), "--out", In("t.bmp"), "--overwrite", "replace"}).status, 0);
-  EXPECT_TRUE(RunCommand({"thumbs", "show", In("a.bmp"), "--out", In("u.bmp")}).Says(In("a.bmp") + ": Damaged file. It is no thumbnail file."));
+  EXPECT_TRUE(RunCommand({"thumbs", "show", In("a.bmp"), "--out", In("u.bmp")})
+                  .Says(In("a.bmp") + ": Damaged file. It is no thumbnail file."));
   EXPECT_TRUE(RunCommand({"thumbs", "show", In("x.THN"), "--out", In("u.bmp")}).Says(In("x.THN") + ": File open error."));
 }
 

@@ -110,7 +110,7 @@ TEST_F(ThumbnailUpdate, TakesTheAnswer) {
     int32_t stored, selected, answer, storedAfter, flagAfter;
     bool asksAfter, builds;
   } rows[] = {
-      {102, 102, 101, 101, 1, true, true},  {7, 101, 102, 102, 1, true, false},   {102, 102, 103, 102, 1, false, false},
+      {102, 102, 101, 101, 1, true, true},  {7, 101, 102, 102, 1, true, false}, {102, 102, 103, 102, 1, false, false},
       {105, 101, 104, 104, 0, true, false}, {103, 103, 0, 103, 1, true, false},
   };
   for (const auto& row : rows) {

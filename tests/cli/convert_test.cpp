@@ -95,8 +95,8 @@ TEST_F(Convert, FailuresLeaveNothingBehindAndStopNobody) {
   fs::create_directory(In("out"));
   fs::create_directory(In("out/a.pcx"));
   mkfifo(In("out/mono.pcx").c_str(), 0600);
-  const CommandResult result = Run({In("broken.bmp"), In("gone.bmp"), In("a.bmp"), In("mono.bmp"), In("tree"), "-t",
-                                    "pcx", "-d", In("out"), "--overwrite", "replace", "--json"});
+  const CommandResult result = Run({In("broken.bmp"), In("gone.bmp"), In("a.bmp"), In("mono.bmp"), In("tree"), "-t", "pcx", "-d",
+                                    In("out"), "--overwrite", "replace", "--json"});
   EXPECT_EQ(result.status, 1);
   std::vector<int> statuses;
   for (const json& element : json::parse(result.out)) {
@@ -162,8 +162,7 @@ TEST_F(Convert, SourcesOfOneNameNeverReplaceEachOther) {
   for (const char* policy : {"keep-both", "replace"}) {
     SCOPED_TRACE(policy);
     fs::remove_all(In("out"));
-    const CommandResult result =
-        Run({In("a.bmp"), In("tree/a.pcx"), "-t", "pcx", "-d", In("out"), "--overwrite", policy});
+    const CommandResult result = Run({In("a.bmp"), In("tree/a.pcx"), "-t", "pcx", "-d", In("out"), "--overwrite", policy});
     EXPECT_EQ(result.status, 0) << result.err;
     EXPECT_THAT(Names("out"), ElementsAre("a [1].pcx", "a.pcx"));
   }

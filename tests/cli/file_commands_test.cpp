@@ -78,8 +78,7 @@ TEST_F(FileCommands, SelectionKeepsItsOrder) {
     EXPECT_EQ(result.status, 0) << result.err;
     EXPECT_EQ(Files(result), row.files);
   }
-  const CommandResult fromInput =
-      RunCommand({"info", "--json", "--files-from", "-"}, {.input = In("sub/c.bmp") + "\n"});
+  const CommandResult fromInput = RunCommand({"info", "--json", "--files-from", "-"}, {.input = In("sub/c.bmp") + "\n"});
   EXPECT_THAT(Files(fromInput), ElementsAre("sub/c.bmp"));
   EXPECT_EQ(RunCommand({"info", "--files-from", In("missing")}).status, 2);
 }
@@ -202,8 +201,7 @@ TEST_F(FileCommands, HostileNames) {
   // Pipes get the name as it is, terminals never a control character.
   EXPECT_THAT(RunCommand({"verify", escape}).out, HasSubstr("e\x1b[31m\n.bmp: Ok"));
   EXPECT_THAT(RunCommand({"verify", escape}, {.output = true}).out, HasSubstr("e\\x1B[31m\\n.bmp: Ok"));
-  const CommandResult failing =
-      RunCommand({"--color=never", "verify", In("\x1b]0;owned\x07.bmp")}, {.interactive = true});
+  const CommandResult failing = RunCommand({"--color=never", "verify", In("\x1b]0;owned\x07.bmp")}, {.interactive = true});
   EXPECT_EQ(failing.err.find('\x1b'), std::string::npos);
 }
 

@@ -26,11 +26,7 @@ TEST(Frame, ExitStatusesAndMessages) {
       {"options only", {"--quiet"}, 2, "", "A command is missing."},
       {"unknown command", {"convrt", "x.bmp"}, 2, "", "There is no command \"convrt\". Did you mean \"convert\"?"},
       {"unknown command, nothing near", {"xyzzy"}, 2, "", "There is no command \"xyzzy\".\n"},
-      {"unknown option",
-       {"match", "--jsn", "a.bmp"},
-       2,
-       "",
-       "match: There is no option \"--jsn\". Did you mean \"--json\"?"},
+      {"unknown option", {"match", "--jsn", "a.bmp"}, 2, "", "match: There is no option \"--jsn\". Did you mean \"--json\"?"},
       {"unknown short option", {"match", "-z", "a.bmp"}, 2, "", "There is no option \"-z\"."},
       {"unknown option before the command", {"--bogus", "match", "a.bmp"}, 2, "", "There is no option \"--bogus\"."},
       {"missing name", {"match"}, 2, "", "NAME... is required"},
@@ -64,8 +60,8 @@ TEST(Frame, ExitStatusesAndMessages) {
 
 // Whatever a name looks like, it comes through byte for byte.
 TEST(Frame, NamesComeThroughUnchanged) {
-  for (const std::string name : {"[a,b].bmp", "[x]", "{}", "%%", "", " ", "a\nb.bmp", "\xff\xfe.bmp", "--", "-x.bmp",
-                                 "--json", "a=b", "++", "/?", "match", "-5", "\"quoted\""}) {
+  for (const std::string name : {"[a,b].bmp", "[x]", "{}", "%%", "", " ", "a\nb.bmp", "\xff\xfe.bmp", "--", "-x.bmp", "--json",
+                                 "a=b", "++", "/?", "match", "-5", "\"quoted\""}) {
     SCOPED_TRACE(name);
     const CommandResult result = RunCommand({"match", "--", name, "end.bmp"});
     EXPECT_THAT(result.out, testing::StartsWith(name + ": "));

@@ -118,8 +118,13 @@ TEST_F(DataFilesTest, NoFaultHarmsAHistory) {
 TEST_F(DataFilesTest, PreviousVersionIsCarriedOverOnce) {
   const std::string previous = folder_.Path("previous");
   ASSERT_TRUE(platform::MakeFolders(previous + "/folder.txt"));
-  const Texts carried{"FMWFileHistoryDatabase.fhdb", "Fotomill Professional 10.ini", "Fotomill.tdb", "My Tabs.browser",
-                      "fmwpro.ccl", "notes.TXT", "x.list"};
+  const Texts carried{"FMWFileHistoryDatabase.fhdb",
+                      "Fotomill Professional 10.ini",
+                      "Fotomill.tdb",
+                      "My Tabs.browser",
+                      "fmwpro.ccl",
+                      "notes.TXT",
+                      "x.list"};
   const Texts left{"Fotomill Professional 11.ini", "Other.tdb", "list", "picture.jpg", "txt"};
   for (const Texts& names : {carried, left}) {
     for (const std::string& name : names) test::WriteText(previous + "/" + name, "old " + name);

@@ -14,12 +14,24 @@ namespace {
 
 TEST(KeyTable, TypesAreTheOnesThatPlugInsKnow) {
   const std::map<std::string, uint32_t> types{
-      {"AllowPluginFormatOverride", 0x1}, {"AnnotateText", 0x2},      {"LogoDelay", 0x4},
-      {"AlphaBackground", 0xC},           {"DefaultViewMode", 0x14},  {"JpegCompression", 0x44},
-      {"ApplicationPath", 0x102},         {"VersionNumber", 0x104},   {"DefaultFileExtension", 0x412},
-      {"DefaultViewZoom", 0x814},         {"DropOptions", 0x814},     {"LibraryStatusFlags", 0x1002},
-      {"WatchFolders", 0x8001},           {"NoThumbnailImage", 0x8002}, {"BrowserThumbnailPrecacheDelay", 0x8044},
-      {"PrefixCrop", 0x10002},            {"FileTipDelay", 0x1},      {"FileHistoryDatabase", 0x2},
+      {"AllowPluginFormatOverride", 0x1},
+      {"AnnotateText", 0x2},
+      {"LogoDelay", 0x4},
+      {"AlphaBackground", 0xC},
+      {"DefaultViewMode", 0x14},
+      {"JpegCompression", 0x44},
+      {"ApplicationPath", 0x102},
+      {"VersionNumber", 0x104},
+      {"DefaultFileExtension", 0x412},
+      {"DefaultViewZoom", 0x814},
+      {"DropOptions", 0x814},
+      {"LibraryStatusFlags", 0x1002},
+      {"WatchFolders", 0x8001},
+      {"NoThumbnailImage", 0x8002},
+      {"BrowserThumbnailPrecacheDelay", 0x8044},
+      {"PrefixCrop", 0x10002},
+      {"FileTipDelay", 0x1},
+      {"FileHistoryDatabase", 0x2},
   };
   for (const auto& [name, type] : types) {
     SCOPED_TRACE(name);
@@ -32,10 +44,15 @@ TEST(KeyTable, TypesAreTheOnesThatPlugInsKnow) {
 
 TEST(KeyTable, OrderHasItsOddPlaces) {
   const std::pair<const char*, const char*> neighbours[] = {
-      {"AllowDestinationOverrides", "AllowPluginFormatOverride"}, {"AlwaysUseTHN", "AlphaBackground"},
-      {"ControlFontName", "ColourTableFile"}, {"LogoDelay", "MattBevelSize"}, {"ResourceStatusFlags", "RememberOpenWindows"},
-      {"SequentialRenameUpdate", "ShowDetailListThumbnails"}, {"SupercompressorSaveFilePrefix", "SWFPlayOptions"},
-      {"UseFolderOverrides", "UseAlphaChannels"}, {"WebPQualityFactor", "ShowWelcomeWizard"},
+      {"AllowDestinationOverrides", "AllowPluginFormatOverride"},
+      {"AlwaysUseTHN", "AlphaBackground"},
+      {"ControlFontName", "ColourTableFile"},
+      {"LogoDelay", "MattBevelSize"},
+      {"ResourceStatusFlags", "RememberOpenWindows"},
+      {"SequentialRenameUpdate", "ShowDetailListThumbnails"},
+      {"SupercompressorSaveFilePrefix", "SWFPlayOptions"},
+      {"UseFolderOverrides", "UseAlphaChannels"},
+      {"WebPQualityFactor", "ShowWelcomeWizard"},
       {"WriteJpegProgressive", "WriteOS2Bitmaps"},
   };
   for (const auto& [first, second] : neighbours) EXPECT_EQ(FindKey(first) + 1, FindKey(second)) << first;
@@ -78,7 +95,8 @@ TEST(KeyTable, StoredTextsStayWithinTheirLimit) {
 TEST(KeyTable, NearestKeyIsAlwaysNamed) {
   const std::pair<const char*, const char*> rows[] = {
       {"FindSimilarDistance", "FindSimlarDistance"}, {"jpegcompression", "JpegCompression"},
-      {"PngCompresion", "PngCompression"}, {"", "AllowDestinationOverrides"}, {"%%%", "AllowDestinationOverrides"},
+      {"PngCompresion", "PngCompression"},           {"", "AllowDestinationOverrides"},
+      {"%%%", "AllowDestinationOverrides"},
   };
   for (const auto& [typed, nearest] : rows) EXPECT_EQ(NearestKey(typed), nearest) << typed;
 }
@@ -86,7 +104,8 @@ TEST(KeyTable, NearestKeyIsAlwaysNamed) {
 TEST(PlainName, LeadsNowhere) {
   for (const char* name : {"", "Cropped_ ", ".hidden", "a.b", "\xC3\xA4\xFF", "a b [1]"}) EXPECT_TRUE(IsPlainName(name)) << name;
   using namespace std::string_view_literals;
-  for (const auto name : {"/"sv, "a/b"sv, "a\\"sv, ".."sv, "a..b"sv, "a\0b"sv, "\n"sv, "\x7F"sv}) EXPECT_FALSE(IsPlainName(name)) << name;
+  for (const auto name : {"/"sv, "a/b"sv, "a\\"sv, ".."sv, "a..b"sv, "a\0b"sv, "\n"sv, "\x7F"sv})
+    EXPECT_FALSE(IsPlainName(name)) << name;
 }
 
 }  // namespace

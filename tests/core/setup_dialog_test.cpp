@@ -72,9 +72,9 @@ using enum KeyNumber;
 
 TEST_F(SetupDialogTest, ShowsEachKindAsItsControlDoes) {
   settings.PrefixCrop = std::string_view("Cut ");
-  FakeDialog& dialog = Filled({WriteOS2Bitmaps, UseAlphaChannels, FileTipDelay, PrefixCrop, AnnotateText, FXBrightness,
-                               JpegCompression, AlphaBackground, TiffOptions, DefaultViewZoom, JpegProcessor,
-                               DefaultFileExtension});
+  FakeDialog& dialog =
+      Filled({WriteOS2Bitmaps, UseAlphaChannels, FileTipDelay, PrefixCrop, AnnotateText, FXBrightness, JpegCompression,
+              AlphaBackground, TiffOptions, DefaultViewZoom, JpegProcessor, DefaultFileExtension});
   EXPECT_FALSE(dialog.At(WriteOS2Bitmaps).checked);
   EXPECT_TRUE(dialog.At(UseAlphaChannels).checked);
   EXPECT_TRUE(dialog.At(FileTipDelay).checked) << "500 is on";
@@ -159,7 +159,8 @@ TEST_F(SetupDialogTest, RefusesAllWhenOneIsWrong) {
       {JpegCompression, "101", "JpegCompression takes a number from 0 to 100."},
       {JpegCompression, "", "JpegCompression takes a whole number."},
       {FXBrightness, "9999999999", "FXBrightness takes a whole number."},
-      {PrefixCrop, "../", "Invalid destination. PrefixCrop takes a name, not a path: no \"/\", \"\\\", \"..\" or control characters."},
+      {PrefixCrop, "../",
+       "Invalid destination. PrefixCrop takes a name, not a path: no \"/\", \"\\\", \"..\" or control characters."},
   };
   for (const Row& row : rows) {
     SCOPED_TRACE(row.text);
@@ -216,13 +217,16 @@ TEST_F(SetupDialogTest, MarkTellsThatWindowsHaveToFollow) {
 }
 
 TEST_F(SetupDialogTest, MarksWhatIsNotTheDefaultAndPutsTheDefaultBack) {
-  const KeyNumber keys[] = {WriteOS2Bitmaps, FileTipDelay, PrefixCrop, JpegCompression, AlphaBackground, JpegProcessor, DefaultFileExtension};
+  const KeyNumber keys[] = {WriteOS2Bitmaps, FileTipDelay,  PrefixCrop,          JpegCompression,
+                            AlphaBackground, JpegProcessor, DefaultFileExtension};
   settings.WriteOS2Bitmaps = settings.JpegProcessor = settings.AlphaBackground = settings.FileTipDelay = 0;
   settings.JpegCompression = 10;
   settings.PrefixCrop = std::string_view("x");
   settings.DefaultFileExtension = std::string_view("TIF");
-  FakeDialog& dialog = Filled({WriteOS2Bitmaps, FileTipDelay, PrefixCrop, JpegCompression, AlphaBackground, JpegProcessor, DefaultFileExtension});
-  for (const KeyNumber key : keys) EXPECT_EQ(ShowsDefault(dialog, formats_, KeyOf(key)), key == WriteOS2Bitmaps) << KeyOf(key).name;
+  FakeDialog& dialog =
+      Filled({WriteOS2Bitmaps, FileTipDelay, PrefixCrop, JpegCompression, AlphaBackground, JpegProcessor, DefaultFileExtension});
+  for (const KeyNumber key : keys)
+    EXPECT_EQ(ShowsDefault(dialog, formats_, KeyOf(key)), key == WriteOS2Bitmaps) << KeyOf(key).name;
   FillSetupDialog(dialog, formats_, Keys(), SetupValues::Default);
   for (const KeyNumber key : keys) EXPECT_TRUE(ShowsDefault(dialog, formats_, KeyOf(key))) << KeyOf(key).name;
   EXPECT_EQ(settings.JpegCompression, 10) << "nothing changes before OK";

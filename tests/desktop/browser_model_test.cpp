@@ -28,9 +28,10 @@ TEST(Filter, PartsAndWildcards) {
     const char* pattern;
     bool matches;
   } const rows[] = {
-      {"Beach.JPG", "", true},        {"Beach.JPG", "each", true},  {"Beach.JPG", "*.jpg", true}, {"Beach.JPG", "jpg*", false},
-      {"Beach.JPG", "b?ach.*", true}, {"Beach.JPG", "b?ach", false}, {"aab", "*a*b", true},        {"aaab", "*ab", true},
-      {"x", "**", true},              {"x", "xy", false},
+      {"Beach.JPG", "", true},      {"Beach.JPG", "each", true},    {"Beach.JPG", "*.jpg", true},
+      {"Beach.JPG", "jpg*", false}, {"Beach.JPG", "b?ach.*", true}, {"Beach.JPG", "b?ach", false},
+      {"aab", "*a*b", true},        {"aaab", "*ab", true},          {"x", "**", true},
+      {"x", "xy", false},
   };
   for (const auto& row : rows) EXPECT_EQ(MatchesFilter(row.name, row.pattern), row.matches) << row.name << " " << row.pattern;
 }
@@ -171,11 +172,21 @@ TEST(CellLayout, HundredThousandCells) {
     Step step;
     size_t to;
   } const rows[] = {
-      {0, Step::Left, 0},   {0, Step::Up, 0},        {3, Step::Up, 3},           {7, Step::Up, 2},
-      {4, Step::Right, 5},  {2, Step::PageDown, 17}, {17, Step::PageUp, 2},      {7, Step::PageUp, 2},
-      {kNoLine, Step::Down, 0}, {99'999, Step::Down, 100'000}, {100'000, Step::Down, 100'000}, {5, Step::Last, 100'000},
+      {0, Step::Left, 0},
+      {0, Step::Up, 0},
+      {3, Step::Up, 3},
+      {7, Step::Up, 2},
+      {4, Step::Right, 5},
+      {2, Step::PageDown, 17},
+      {17, Step::PageUp, 2},
+      {7, Step::PageUp, 2},
+      {kNoLine, Step::Down, 0},
+      {99'999, Step::Down, 100'000},
+      {100'000, Step::Down, 100'000},
+      {5, Step::Last, 100'000},
   };
-  for (const auto& row : rows) EXPECT_EQ(layout.Move(row.from, row.step), row.to) << row.from << " " << static_cast<int>(row.step);
+  for (const auto& row : rows)
+    EXPECT_EQ(layout.Move(row.from, row.step), row.to) << row.from << " " << static_cast<int>(row.step);
   EXPECT_EQ(layout.ScrollToShow(0, 5000), 0);
   EXPECT_EQ(layout.ScrollToShow(100'000, 0), layout.LargestScroll());
   EXPECT_EQ(layout.ScrollToShow(6, 30), 30);

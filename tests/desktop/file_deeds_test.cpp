@@ -107,7 +107,8 @@ TEST(Session, ComesBackAndForgivesOddLines) {
   EXPECT_EQ(ParseSession(SessionText(session)), session);
   session.tabs[1].folder = "/new\nline";
   EXPECT_EQ(ParseSession(SessionText(session)).tabs.size(), 1u);
-  const Session odd = ParseSession("Folder=/lost\r\n[Tab]\r\nFolder=/x\r\nScroll=-5\r\nViewMode=99999999999\r\nnonsense\r\n[Tab]\n[Frame]\nTab=-1");
+  const Session odd = ParseSession(
+      "Folder=/lost\r\n[Tab]\r\nFolder=/x\r\nScroll=-5\r\nViewMode=99999999999\r\nnonsense\r\n[Tab]\n[Frame]\nTab=-1");
   ASSERT_EQ(odd.tabs.size(), 1u);
   EXPECT_EQ(odd.tabs[0].folder, "/x");
   EXPECT_EQ(odd.tabs[0].scroll, 0);

@@ -12,8 +12,8 @@
 #include "core/settings.h"
 #include "desktop/configuration_transfer.h"
 #include "desktop/exif_report.h"
-#include "desktop/history_dates.h"
 #include "desktop/file_history_list.h"
+#include "desktop/history_dates.h"
 #include "desktop/info_report.h"
 #include "desktop/upkeep.h"
 #include "metadata/exif_text.h"
@@ -105,7 +105,8 @@ TEST_F(Reports, InfoOfOneAndOfSeveral) {
   EXPECT_EQ(ValueOf(summary, "The same in all", "Folder"), folder_.Path() + "/");
   EXPECT_EQ(ValueOf(summary, "Different", "File size"), "2 different: 50,678 bytes (2 files); 19 bytes");
   EXPECT_EQ(ValueOf(summary, "Different", "Dimensions"), "150 x 112 pixels (in 2 of 3 files)");
-  EXPECT_THAT(TextOf(broken), testing::StartsWith(folder_.Path("no.png") + "\n" + broken.problem + "\nGeneral\n    File name: no.png\n"));
+  EXPECT_THAT(TextOf(broken),
+              testing::StartsWith(folder_.Path("no.png") + "\n" + broken.problem + "\nGeneral\n    File name: no.png\n"));
 }
 
 TEST(HistoryDates, EachStyle) {
@@ -114,9 +115,15 @@ TEST(HistoryDates, EachStyle) {
     int64_t seconds;
     const char* styles[4];
   } const rows[] = {
-      {1795287909, {"Saturday, November 21, 2026 7:05:09 p.m.", "Saturday, November 21, 2026 19:05:09", "2026-11-21 7:05 p.m.", "2026-11-21 19:05"}},
-      {0, {"Thursday, January 1, 1970 12:00:00 a.m.", "Thursday, January 1, 1970 00:00:00", "1970-01-01 12:00 a.m.", "1970-01-01 00:00"}},
-      {43200, {"Thursday, January 1, 1970 12:00:00 p.m.", "Thursday, January 1, 1970 12:00:00", "1970-01-01 12:00 p.m.", "1970-01-01 12:00"}},
+      {1795287909,
+       {"Saturday, November 21, 2026 7:05:09 p.m.", "Saturday, November 21, 2026 19:05:09", "2026-11-21 7:05 p.m.",
+        "2026-11-21 19:05"}},
+      {0,
+       {"Thursday, January 1, 1970 12:00:00 a.m.", "Thursday, January 1, 1970 00:00:00", "1970-01-01 12:00 a.m.",
+        "1970-01-01 00:00"}},
+      {43200,
+       {"Thursday, January 1, 1970 12:00:00 p.m.", "Thursday, January 1, 1970 12:00:00", "1970-01-01 12:00 p.m.",
+        "1970-01-01 12:00"}},
   };
   for (const auto& row : rows) {
     for (int32_t mode = 0; mode < 4; ++mode) EXPECT_EQ(HistoryDate(row.seconds, mode), row.styles[mode]);
@@ -150,7 +157,8 @@ TEST_F(Reports, HistorySortsRemovesAndForgets) {
   ASSERT_EQ(UpdateFileHistory({&later, 1}), HistoryUpdate::Done);
   EXPECT_TRUE(list.Remove({0, 2}));
   EXPECT_THAT(names(), ElementsAre("B.bmp"));
-  EXPECT_THAT(test::ReadText(FileHistoryPath()), testing::AllOf(HasSubstr("B.bmp"), HasSubstr("c.bmp"), testing::Not(HasSubstr("a2"))));
+  EXPECT_THAT(test::ReadText(FileHistoryPath()),
+              testing::AllOf(HasSubstr("B.bmp"), HasSubstr("c.bmp"), testing::Not(HasSubstr("a2"))));
   EXPECT_TRUE(list.Clear());
   EXPECT_FALSE(platform::FileExists(FileHistoryPath()));
   test::WriteText(FileHistoryPath(), "no history at all");
@@ -202,10 +210,12 @@ TEST_F(Reports, SettingsTravel) {
   settings.JpegCompression = 42;
   settings.PrefixCrop = std::string_view("Cut ");
   ASSERT_TRUE(ExportConfiguration(folder_.Path("out.ini")).ok) << "what was not saved yet is saved first";
-  EXPECT_THAT(test::ReadText(folder_.Path("out.ini")), testing::AllOf(testing::StartsWith(";\r\n;\r\n;------ INI"), HasSubstr("JpegCompression=42\n")));
+  EXPECT_THAT(test::ReadText(folder_.Path("out.ini")),
+              testing::AllOf(testing::StartsWith(";\r\n;\r\n;------ INI"), HasSubstr("JpegCompression=42\n")));
   settings.JpegCompression = 80;
   settings.UndoLevels = 3;
-  test::WriteText(folder_.Path("in.ini"), test::ReadText(folder_.Path("out.ini")) + "PngCompression=many\nNoSuchKey=1\nVersionNumber=9\n");
+  test::WriteText(folder_.Path("in.ini"),
+                  test::ReadText(folder_.Path("out.ini")) + "PngCompression=many\nNoSuchKey=1\nVersionNumber=9\n");
   const Transfer transfer = ImportConfiguration(folder_.Path("in.ini"));
   EXPECT_TRUE(transfer.ok);
   EXPECT_EQ(transfer.message,

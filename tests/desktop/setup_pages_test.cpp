@@ -21,7 +21,8 @@ std::set<std::string> UsedKeys() {
   std::set<std::string> used;
   for (const auto& entry : std::filesystem::recursive_directory_iterator(test::SourcePath("src"))) {
     const std::string name = entry.path().filename().string();
-    if (!entry.is_regular_file() || name == "setup_pages.cpp" || name == "override_options.cpp" || name == "spin_range.cpp") continue;
+    if (!entry.is_regular_file() || name == "setup_pages.cpp" || name == "override_options.cpp" || name == "spin_range.cpp")
+      continue;
     const std::string text = test::ReadText(entry.path().string());
     for (const std::string_view lead : {"settings.", "KeyNumber::", "&Settings::"}) {
       for (size_t at = text.find(lead); at != std::string::npos; at = text.find(lead, at + 1)) {
@@ -74,14 +75,18 @@ TEST(SetupHelp, EntriesArePlainTextAndEndWhereTheNextBegins) {
   EXPECT_EQ(HelpOn("FileHistoryDatabase").text, "The name of the history file in the data folder, without its extension .fhdb.");
   const HelpText general = HelpOn("NoSuchKey");
   EXPECT_EQ(general.title, "Configuration");
-  EXPECT_THAT(general.text, testing::StartsWith("Everything that can be adjusted is a named key. fotomill config list shows all of them with their values, "));
+  EXPECT_THAT(general.text,
+              testing::StartsWith(
+                  "Everything that can be adjusted is a named key. fotomill config list shows all of them with their values, "));
   EXPECT_THAT(general.text, testing::HasSubstr("\n    [Fotomill]\n    JpegCompression=85\n"));
   EXPECT_THAT(general.text, testing::HasSubstr("\n\nWhere it lies\n\n"));
-  for (const char* topic : {"OVERWRITE", "RENAME"}) EXPECT_FALSE(HelpOn(topic).text.empty()) << topic << " has no part of its own in the manual";
+  for (const char* topic : {"OVERWRITE", "RENAME"})
+    EXPECT_FALSE(HelpOn(topic).text.empty()) << topic << " has no part of its own in the manual";
   const HelpText manual = HelpOn(kManual);
   EXPECT_EQ(manual.title, "The desktop program");
   EXPECT_THAT(manual.text, testing::HasSubstr("\nF5, F9   read the folder again, show or hide the folders at the left\n"));
-  EXPECT_THAT(manual.text, testing::Not(testing::ContainsRegex("[|`(]desktop-|png|--- "))) << "marks, addresses and pictures are left out";
+  EXPECT_THAT(manual.text, testing::Not(testing::ContainsRegex("[|`(]desktop-|png|--- ")))
+      << "marks, addresses and pictures are left out";
 }
 
 TEST(OverrideOptions, BelongToFormatsThatAreWritten) {

@@ -119,7 +119,8 @@ ThumbnailPointer SlowThumbnail(const ThumbnailWish& wish) {
 
 TEST(ThumbnailLoader, ForgetsWhatIsNoLongerWanted) {
   std::atomic<int> wakes{0};
-  ThumbnailLoader loader(1, [&] { ++wakes; }, SlowThumbnail);
+  ThumbnailLoader loader(
+      1, [&] { ++wakes; }, SlowThumbnail);
   const auto wish = [](const char* path) { return ThumbnailWish{path, 1, 2, 96, 0}; };
   loader.Want({wish("a"), wish("b"), wish("c")});
   while (loads == 0) std::this_thread::yield();

@@ -4,9 +4,9 @@
 #include <gtest/gtest.h>
 
 #include "core/limits.h"
+#include "support/codecs.h"
 #include "support/files.h"
 #include "support/hex.h"
-#include "support/codecs.h"
 #include "support/scoped_settings.h"
 
 namespace fotomill::test {
@@ -87,10 +87,9 @@ TEST(BmpRead, UncompressedRows) {
       {"24 bits, offset back into the header", Windows({1, 1, 24, 0, 0}, ""), Status::Ok, "004D42"},
       {"32 bits", Windows({2, 1, 32}, "010203FF 040506FF"), Status::Ok, "030201 060504"},
       {"5-5-5 gives red first", Windows({2, 1, 16}, "1F00 007C"), Status::Ok, "F80000 0000F8"},
-      {"5-6-5 masks, pixels 12 bytes past the offset",
-       Windows({2, 1, 16, 3, 54}, "00F80000 E0070000 1F000000  1F00 E007"), Status::Ok, "0000F8 00FC00"},
-      {"other masks are 5-5-5", Windows({2, 1, 16, 3, 54}, "007C0000 E0030000 1F000000  1F00 007C"), Status::Ok,
-       "F80000 0000F8"},
+      {"5-6-5 masks, pixels 12 bytes past the offset", Windows({2, 1, 16, 3, 54}, "00F80000 E0070000 1F000000  1F00 E007"),
+       Status::Ok, "0000F8 00FC00"},
+      {"other masks are 5-5-5", Windows({2, 1, 16, 3, 54}, "007C0000 E0030000 1F000000  1F00 007C"), Status::Ok, "F80000 0000F8"},
       {"2 bits are copied as they are", Indexed({5, 1, 2}, "1B 40 0000"), Status::Ok, "1 11 4 0 0"},
       {"12 bits are copied as they are", Windows({2, 1, 12}, "01020300"), Status::Ok, "030201 000000"},
       {"48 bits are cut to the row", Windows({1, 1, 48}, "010203040506 0000"), Status::Ok, "030201"},
@@ -108,11 +107,11 @@ TEST(BmpRead, UncompressedRows) {
 
 TEST(BmpRead, RunLengthRows) {
   const ReadCase rows[] = {
-      {"run and literals", Indexed({5, 2, 8, 1}, "03 07  00 02 01 00  01 09  00 00   00 05 01 02 03 04 05 FF  00 01"),
-       Status::Ok, "1 2 3 4 5 / 7 7 7 0 9"},
+      {"run and literals", Indexed({5, 2, 8, 1}, "03 07  00 02 01 00  01 09  00 00   00 05 01 02 03 04 05 FF  00 01"), Status::Ok,
+       "1 2 3 4 5 / 7 7 7 0 9"},
       {"literals of even length have no pad", Indexed({4, 1, 8, 1}, "00 04 01 02 03 04  00 01"), Status::Ok, "1 2 3 4"},
-      {"beyond the row and above the top",
-       Indexed({2, 1, 8, 1}, "05 03  01 04  00 00  02 05  00 02 FF FF  02 06  00 01"), Status::Ok, "3 3"},
+      {"beyond the row and above the top", Indexed({2, 1, 8, 1}, "05 03  01 04  00 00  02 05  00 02 FF FF  02 06  00 01"),
+       Status::Ok, "3 3"},
       {"move up", Indexed({2, 2, 8, 1}, "00 02 01 01  01 05  00 01"), Status::Ok, "0 5 / 0 0"},
       {"top row first", Indexed({1, -2, 8, 1}, "01 05  00 00  01 06  00 01"), Status::Ok, "5 / 6"},
       {"no end of bitmap", Indexed({1, 1, 8, 1}, "01 05"), Status::FileReadError, ""},
@@ -120,14 +119,12 @@ TEST(BmpRead, RunLengthRows) {
       {"ends in a move", Indexed({1, 1, 8, 1}, "00 02 01"), Status::FileReadError, ""},
       {"pad of a literal run missing", Indexed({3, 1, 8, 1}, "00 03 01 02 03"), Status::FileReadError, ""},
       {"runs of 4 bits alternate", Indexed({7, 1, 4, 2}, "05 12  00 00  00 01"), Status::Ok, "1 2 1 2 1 0 0"},
-      {"an odd start and a run cut by the row", Indexed({6, 1, 4, 2}, "01 30  FF 12  00 01"), Status::Ok,
-       "3 1 2 1 2 1"},
+      {"an odd start and a run cut by the row", Indexed({6, 1, 4, 2}, "01 30  FF 12  00 01"), Status::Ok, "3 1 2 1 2 1"},
       {"5 literals of 4 bits", Indexed({6, 1, 4, 2}, "01 90  00 05 12 34 5F FF  00 01"), Status::Ok, "9 1 2 3 4 5"},
-      {"6 and 7 literals of 4 bits", Indexed({7, 2, 4, 2}, "00 06 12 34 56 FF  00 00  00 07 12 34 56 7F  00 01"),
-       Status::Ok, "1 2 3 4 5 6 7 / 1 2 3 4 5 6 0"},
+      {"6 and 7 literals of 4 bits", Indexed({7, 2, 4, 2}, "00 06 12 34 56 FF  00 00  00 07 12 34 56 7F  00 01"), Status::Ok,
+       "1 2 3 4 5 6 7 / 1 2 3 4 5 6 0"},
       {"8-bit codes in a 4-bit picture fill its bytes", Indexed({4, 1, 4, 1}, "04 12  00 01"), Status::Ok, "1 2 1 2"},
-      {"4-bit codes in an 8-bit picture fill its first half", Indexed({4, 1, 8, 2}, "04 12  00 01"), Status::Ok,
-       "18 18 0 0"},
+      {"4-bit codes in an 8-bit picture fill its first half", Indexed({4, 1, 8, 2}, "04 12  00 01"), Status::Ok, "18 18 0 0"},
       {"8-bit codes in a 24-bit picture", Windows({3, 1, 24, 1}, "03 12  00 01"), Status::Ok, "121212 000000 000000"},
   };
   ExpectReads(rows);
@@ -135,10 +132,10 @@ TEST(BmpRead, RunLengthRows) {
 
 TEST(BmpRead, Os2Rows) {
   const ReadCase rows[] = {
-      {"1 bit after its palette", Os2(3, 1, 1, "000000 FFFFFF  A0000000 0000000000000000000000000000000000000000"),
-       Status::Ok, "1 0 1"},
-      {"24 bits after the header", Os2(1, 7, 24, "01020300 01020300 01020300 01020300 01020300 01020300 04050600"),
-       Status::Ok, "060504 / 030201 / 030201 / 030201 / 030201 / 030201 / 030201"},
+      {"1 bit after its palette", Os2(3, 1, 1, "000000 FFFFFF  A0000000 0000000000000000000000000000000000000000"), Status::Ok,
+       "1 0 1"},
+      {"24 bits after the header", Os2(1, 7, 24, "01020300 01020300 01020300 01020300 01020300 01020300 04050600"), Status::Ok,
+       "060504 / 030201 / 030201 / 030201 / 030201 / 030201 / 030201"},
       {"height is unsigned", Os2(1, 0x8001, 1, "000000 FFFFFF 0000000000000000000000000000000000000000000000"),
        Status::FileReadError, ""},
       {"a whole file of less than 54 bytes", Os2(1, 1, 24, "01020300"), Status::FileReadError, ""},
@@ -155,12 +152,10 @@ TEST(BmpRead, PaletteFollowsTheShortHeader) {
   const std::string padding(2 * 1024, '0');
   const Row rows[] = {
       {"blue, green, red, 0", Windows({1, 1, 8}, "01020300 04050600" + padding), Hex("030201 060504 000000")},
-      {"a longer header does not move it", Windows({1, 1, 8, 0, -1, 108}, "01020300 04050600" + padding),
-       Hex("030201 060504")},
+      {"a longer header does not move it", Windows({1, 1, 8, 0, -1, 108}, "01020300 04050600" + padding), Hex("030201 060504")},
       {"a short one leaves the rest", Windows({1, 1, 4, 0, 0}, "01020300 040506"), Hex("030201 FFFFFF 000000")},
       {"OS/2 has three bytes an entry", Os2(1, 1, 8, "010203 040506" + padding), Hex("030201 060504 000000")},
-      {"deep pictures get the display palette", Windows({1, 1, 24}, "00000000"),
-       Hex("000000 000055 0000AA 0000FF 002400")},
+      {"deep pictures get the display palette", Windows({1, 1, 24}, "00000000"), Hex("000000 000055 0000AA 0000FF 002400")},
   };
   for (const Row& row : rows) {
     SCOPED_TRACE(row.name);
@@ -202,26 +197,22 @@ TEST(BmpInfo, FactsOfTheHeader) {
   };
   const int32_t least = INT32_MIN;
   const Row rows[] = {
-      {"2 bits stay 2", Indexed({9, 3, 2}, "000000000000000000000000"), Status::Ok, Status::Ok, "Windows bitmap", 9, 3,
-       2, 12, 0},
-      {"16 bits are 24", Windows({9, -3, 16}, std::string(240, '0')), Status::Ok, Status::Ok, "Windows bitmap", 9, 3,
-       24, 144, 0},
-      {"32 bits have alpha", Windows({1, 1, 32}, "00000000"), Status::Ok, Status::Ok, "Windows bitmap", 1, 1, 24, 24,
-       1},
+      {"2 bits stay 2", Indexed({9, 3, 2}, "000000000000000000000000"), Status::Ok, Status::Ok, "Windows bitmap", 9, 3, 2, 12, 0},
+      {"16 bits are 24", Windows({9, -3, 16}, std::string(240, '0')), Status::Ok, Status::Ok, "Windows bitmap", 9, 3, 24, 144, 0},
+      {"32 bits have alpha", Windows({1, 1, 32}, "00000000"), Status::Ok, Status::Ok, "Windows bitmap", 1, 1, 24, 24, 1},
       {"OS/2", Os2(8, 1, 8, std::string(2 * 800, '0')), Status::Ok, Status::Ok, "OS/2 bitmap", 8, 1, 8, 8, 0},
       {"zero width", Windows({0, 1, 24}, "00"), Status::DamagedFile, Status::DamagedFile, "", 0, 0, 0, 0, 0},
       {"negative width", Windows({-5, 1, 24}, "00"), Status::DamagedFile, Status::DamagedFile, "", 0, 0, 0, 0, 0},
       {"zero height", Windows({1, 0, 24}, "00"), Status::DamagedFile, Status::DamagedFile, "", 0, 0, 0, 0, 0},
       {"the least height", Windows({1, least, 24}, "00"), Status::DamagedFile, Status::DamagedFile, "", 0, 0, 0, 0, 0},
       {"no bits", Windows({1, 1, 0}, "00000000"), Status::DamagedFile, Status::DamagedFile, "", 0, 0, 0, 0, 0},
-      {"the largest sizes", Windows({INT32_MAX, INT32_MAX, 65535}, "00"), Status::Ok, Status::FileReadError,
-       "Windows bitmap", INT32_MAX, INT32_MAX, 24, uint64_t{268435456} * 24 * INT32_MAX, 1},
-      {"beyond the limit", Windows({40000, 40000, 8, 1, 54}, "0001"), Status::Ok, Status::MemoryAllocationError,
-       "Windows bitmap", 40000, 40000, 8, uint64_t{5000} * 8 * 40000, 0},
+      {"the largest sizes", Windows({INT32_MAX, INT32_MAX, 65535}, "00"), Status::Ok, Status::FileReadError, "Windows bitmap",
+       INT32_MAX, INT32_MAX, 24, uint64_t{268435456} * 24 * INT32_MAX, 1},
+      {"beyond the limit", Windows({40000, 40000, 8, 1, 54}, "0001"), Status::Ok, Status::MemoryAllocationError, "Windows bitmap",
+       40000, 40000, 8, uint64_t{5000} * 8 * 40000, 0},
       {"short header", Bytes(53, 'B'), Status::DamagedFile, Status::FileReadError, "", 0, 0, 0, 0, 0},
       {"empty", {}, Status::DamagedFile, Status::FileReadError, "", 0, 0, 0, 0, 0},
-      {"another signature", Hex("4241" + std::string(200, '0')), Status::DamagedFile, Status::DamagedFile, "", 0, 0, 0,
-       0, 0},
+      {"another signature", Hex("4241" + std::string(200, '0')), Status::DamagedFile, Status::DamagedFile, "", 0, 0, 0, 0, 0},
   };
   for (const Row& row : rows) {
     SCOPED_TRACE(row.name);
@@ -255,8 +246,7 @@ PicturePointer OneRow(int32_t bitsPerPixel, std::initializer_list<int32_t> pixel
   int32_t x = 0;
   for (const int32_t pixel : pixels) SetPixel(picture->image, x++, 0, pixel);
   if (alpha && NewAlphaPlane(picture->width, 1, picture->alpha) == Status::Ok) {
-    for (x = 0; x < picture->width; ++x)
-      picture->alpha.StoredRow(0)[static_cast<size_t>(x)] = static_cast<uint8_t>(0x80 + x);
+    for (x = 0; x < picture->width; ++x) picture->alpha.StoredRow(0)[static_cast<size_t>(x)] = static_cast<uint8_t>(0x80 + x);
   }
   return picture;
 }
@@ -338,15 +328,13 @@ TEST(BmpDetails, LinesOfBothDialects) {
        Hex("424D 40E20100 00000000 36000000  28000000 D2040000 81FFFFFF 0100 1800 00000000 15CD5B07"
            "130B0000 FFFFFFFF E8030000 FFFFFFFF"),
        {"WINDOWS BITMAP", "            File size: 123,456", "          Header size: 54", "            Info size: 40",
-        "                Width: 1,234", "                Depth: -127", "               Planes: 1",
-        "                 Bits: 24", "          Compression: 0", "           Image size: 123,456,789",
-        "Horizontal resolution: 2835", "  Vertical resolution: 4294967295", "          Colors used: 1,000",
-        "     Colors important: 4,294,967,295"}},
+        "                Width: 1,234", "                Depth: -127", "               Planes: 1", "                 Bits: 24",
+        "          Compression: 0", "           Image size: 123,456,789", "Horizontal resolution: 2835",
+        "  Vertical resolution: 4294967295", "          Colors used: 1,000", "     Colors important: 4,294,967,295"}},
       {"OS/2",
        Os2(65535, 2, 4, std::string(56, '0')),
        {"OS/2 BITMAP", "            File size: 0", "          Header size: 2147483647", "            Info size: 12",
-        "                Width: 65,535", "                Depth: 2", "               Planes: 1",
-        "                 Bits: 4"}},
+        "                Width: 65,535", "                Depth: 2", "               Planes: 1", "                 Bits: 4"}},
   };
   const TemporaryFolder folder;
   for (const Row& row : rows) {

@@ -202,8 +202,7 @@ TEST(EveryCodec, ReadsGoodPictures) {
     EXPECT_EQ(described->width, picture->image.Width());
     EXPECT_EQ(described->height, picture->image.Height());
     const fs::path path(file);
-    const fs::path reference =
-        path.parent_path().parent_path() / "reference" / path.filename().replace_extension(".bmp");
+    const fs::path reference = path.parent_path().parent_path() / "reference" / path.filename().replace_extension(".bmp");
     if (!fs::exists(reference)) continue;
     PicturePointer expected;
     ASSERT_EQ(LoadPicture(reference.c_str(), expected), Status::Ok);

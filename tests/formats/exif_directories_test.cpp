@@ -22,9 +22,7 @@ std::vector<std::string> LinesOf(const std::vector<uint8_t>& block) {
 }
 
 // What is told of the picture: without the layout of a first directory and without the thumbnail.
-std::vector<std::string> PictureLines(const std::vector<uint8_t>& block) {
-  return LinesOf(MakeExifBlock(ParseExifBlock(block)));
-}
+std::vector<std::string> PictureLines(const std::vector<uint8_t>& block) { return LinesOf(MakeExifBlock(ParseExifBlock(block))); }
 
 TEST(ExifDirectories, TravelThroughFilesOfDirectories) {
   struct Row {

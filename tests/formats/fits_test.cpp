@@ -72,11 +72,11 @@ TEST(Fits, WritesGreyOfEveryDepth) {
       {"6 bits name 64 colours", 2, 6, Hex("01 40"), Hex("0F 00")},
       {"24 bits: each product is rounded down", 3, 24, Hex("09 09 09  FF FF FF  05 5A C8"), Hex("07 FE 71")},
   };
-  const Bytes palette = Hex(
-      "FF 28 00   # 76 + 23 + 0 = 99; one division would give 100\n"
-      "10 13 05   # 4 + 11 + 0 = 15\n"
-      "20 22 0B   # 9 + 20 + 1 = 30\n"
-      "06 0B 25   # 1 + 6 + 4 = 11\n");
+  const Bytes palette =
+      Hex("FF 28 00   # 76 + 23 + 0 = 99; one division would give 100\n"
+          "10 13 05   # 4 + 11 + 0 = 15\n"
+          "20 22 0B   # 9 + 20 + 1 = 30\n"
+          "06 0B 25   # 1 + 6 + 4 = 11\n");
   for (const auto& row : rows) {
     SCOPED_TRACE(row.name);
     const PicturePointer picture = MakePicture(row.width, 1, row.bitsPerPixel, {row.row});
@@ -101,8 +101,7 @@ TEST(Fits, GreyOfEveryLevelFollowsTheFormula) {
 }
 
 TEST(Fits, ReadsHeaders) {
-  constexpr Status kOk = Status::Ok, kDamaged = Status::DamagedFile, kShort = Status::FileReadError,
-                   kNone = Status::NoImages;
+  constexpr Status kOk = Status::Ok, kDamaged = Status::DamagedFile, kShort = Status::FileReadError, kNone = Status::NoImages;
   const std::string plain = Header("BITPIX  = 8|NAXIS   = 2|NAXIS1  = 2|NAXIS2  = 3");
   const std::string size1 = "|NAXIS1=1|NAXIS2=1", huge = "2147483647";
   // clang-format off
@@ -164,7 +163,8 @@ TEST(Fits, FindsTheEndOfTheHeader) {
   const struct {
     size_t cards;  // before END; 35 of them let it end the first block
     Status read;
-  } rows[] = {{35, Status::Ok}, {36, Status::Ok}, {65535, Status::Ok}, {65536, Status::FileReadError}, {131072, Status::FileReadError}};
+  } rows[] = {
+      {35, Status::Ok}, {36, Status::Ok}, {65535, Status::Ok}, {65536, Status::FileReadError}, {131072, Status::FileReadError}};
   const TemporaryFolder folder;
   const std::string path = folder.Path("cards.fits");
   for (const auto& row : rows) {
@@ -214,8 +214,8 @@ TEST(Fits, DetailsListTheCards) {
   EXPECT_EQ(FitsDetails(*picture), Status::FileOpenError);
   WriteText(path, Cards("SIMPLE  =                    T / a comment that goes on and on|NAXIS1  = 5||=x|END|AFTER = 1"));
   ASSERT_EQ(FitsDetails(*picture), Status::Ok);
-  const std::string_view expected[] = {"SIMPLE = T / a comment that goes on ", "NAXIS1 = 5                          ",
-                                       " = ", " = x                                ", "END = "};
+  const std::string_view expected[] = {"SIMPLE = T / a comment that goes on ", "NAXIS1 = 5                          ", " = ",
+                                       " = x                                ", "END = "};
   ASSERT_EQ(picture->detailLines.Count(), std::size(expected));
   for (size_t i = 0; i < std::size(expected); ++i) EXPECT_EQ(picture->detailLines.Line(i), expected[i]);
 

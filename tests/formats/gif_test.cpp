@@ -36,12 +36,12 @@ TEST(GifRead, Frames) {
        "FF0000 000000 / 0000FF 000000", "255 0 / 255 255"},
       {"local palette", Gif("0200 0200 00 00 00", place + "81 " + kPalette + kFourPixels), Status::Ok, "1 2 / 3 0", ""},
       {"no palette reads as greys", Gif("0200 0200 00 00 00", place + "00 " + kFourPixels), Status::Ok, "1 2 / 3 0", ""},
-      {"a frame smaller than the screen", Gif("0300 0200 81 00 00 " + std::string(kPalette),
-                                              "2C 0100 0000 0200 0200 00 " + std::string(kFourPixels)),
-       Status::Ok, "000000 FF0000 00FF00 / 000000 0000FF 000000", "0 255 255 / 0 255 255"},
-      {"a frame beyond the screen is cut", Gif("0200 0200 81 00 00 " + std::string(kPalette),
-                                               "2C 0100 0100 0200 0200 00 " + std::string(kFourPixels)),
-       Status::Ok, "000000 000000 / 000000 FF0000", "0 0 / 0 255"},
+      {"a frame smaller than the screen",
+       Gif("0300 0200 81 00 00 " + std::string(kPalette), "2C 0100 0000 0200 0200 00 " + std::string(kFourPixels)), Status::Ok,
+       "000000 FF0000 00FF00 / 000000 0000FF 000000", "0 255 255 / 0 255 255"},
+      {"a frame beyond the screen is cut",
+       Gif("0200 0200 81 00 00 " + std::string(kPalette), "2C 0100 0100 0200 0200 00 " + std::string(kFourPixels)), Status::Ok,
+       "000000 000000 / 000000 FF0000", "0 0 / 0 255"},
       {"a screen without size", Gif("0000 0000 81 00 00 " + std::string(kPalette), place + "00 " + kFourPixels), Status::Ok,
        "1 2 / 3 0", ""},
       {"stray bytes and unknown extensions", Gif(screen, "00 21 42 02 AA BB 00 00 " + place + "00 " + kFourPixels), Status::Ok,
@@ -68,8 +68,10 @@ TEST(GifRead, LaterFramesStandOnTheOnesBefore) {
   const auto file = [](const char* disposal) {
     return Gif("0200 0100 81 00 00 " + std::string(kPalette),
                "2C 0000 0000 0200 0100 00 02 02 4C 0A 00 "
-               "21 F9 04 " + std::string(disposal) + " 0000 00 00 2C 0100 0000 0100 0100 00 02 02 54 01 00 "
-               "21 F9 04 00 0000 00 00 2C 0000 0000 0100 0100 00 02 02 5C 01 00 ");
+               "21 F9 04 " +
+                   std::string(disposal) +
+                   " 0000 00 00 2C 0100 0000 0100 0100 00 02 02 54 01 00 "
+                   "21 F9 04 00 0000 00 00 2C 0000 0000 0100 0100 00 02 02 5C 01 00 ");
   };
   struct Row {
     const char* disposal;

@@ -23,8 +23,7 @@ TEST(Hdp, QuantizerZeroKeepsEveryPixelAndOthersStayClose) {
   };
   for (const Row& row : {Row{0, 0, true}, Row{0, 1, true}, Row{60, 0, false}}) {
     for (const int32_t bits : {8, 24}) {
-      SCOPED_TRACE(std::to_string(row.compression) + ", " + std::to_string(row.options) + ", " + std::to_string(bits) +
-                   " bits");
+      SCOPED_TRACE(std::to_string(row.compression) + ", " + std::to_string(row.options) + ", " + std::to_string(bits) + " bits");
       settings.HDPCompression = row.compression;
       settings.HDPWriteOptions = row.options;
       const PicturePointer picture = PatternPicture(45, 37, bits);
@@ -42,8 +41,7 @@ TEST(Hdp, QuantizerZeroKeepsEveryPixelAndOthersStayClose) {
       if (!HasProgram("JxrDecApp")) continue;
       const TemporaryFolder folder;
       WriteBytes(folder.Path("a.wdp"), file);
-      ASSERT_TRUE(RunShell("JxrDecApp -i " + folder.Path("a.wdp") + " -o " + folder.Path("a.bmp") + " > " +
-                           folder.Path("log")));
+      ASSERT_TRUE(RunShell("JxrDecApp -i " + folder.Path("a.wdp") + " -o " + folder.Path("a.bmp") + " > " + folder.Path("log")));
       PicturePointer peer;
       ASSERT_EQ(LoadPicture(folder.Path("a.bmp").c_str(), peer), Status::Ok);
       EXPECT_TRUE(SamePixels(peer->image, back.picture->image));

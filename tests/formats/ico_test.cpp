@@ -18,7 +18,8 @@ using Bytes = std::vector<uint8_t>;
 std::string OneIcon(const std::string& picture) { return "0000 0100 0100  02 01 00 00 0100 2000 FFFFFFFF 16000000 " + picture; }
 // A bitmap header of two pixels by one.
 std::string Bitmap(const char* bits, const std::string& rest) {
-  return std::string("28000000 02000000 02000000 0100 ") + bits + " 00000000 00000000 00000000 00000000 00000000 00000000 " + rest;
+  return std::string("28000000 02000000 02000000 0100 ") + bits + " 00000000 00000000 00000000 00000000 00000000 00000000 " +
+         rest;
 }
 
 TEST(IcoRead, Entries) {
@@ -34,8 +35,10 @@ TEST(IcoRead, Entries) {
       {"32 bits without alpha: the mask counts", OneIcon(Bitmap("2000", "01020300 04050600  40000000")), Status::Ok,
        "030201 060504", "255 0"},
       {"24 bits, opaque", OneIcon(Bitmap("1800", "010203 040506 0000  00000000")), Status::Ok, "030201 060504", ""},
-      {"1 bit, opaque, keeps its palette", OneIcon(Bitmap("0100", "00000000 FFFFFF00  40000000  00000000")), Status::Ok, "0 1", ""},
-      {"1 bit with a mask", OneIcon(Bitmap("0100", "00000000 0000FF00  40000000  80000000")), Status::Ok, "000000 FF0000", "0 255"},
+      {"1 bit, opaque, keeps its palette", OneIcon(Bitmap("0100", "00000000 FFFFFF00  40000000  00000000")), Status::Ok, "0 1",
+       ""},
+      {"1 bit with a mask", OneIcon(Bitmap("0100", "00000000 0000FF00  40000000  80000000")), Status::Ok, "000000 FF0000",
+       "0 255"},
       {"no mask", OneIcon(Bitmap("1800", "010203 040506 0000")), Status::Ok, "030201 060504", ""},
       {"no colours", OneIcon(Bitmap("1800", "010203")), Status::FileReadError, "", ""},
       {"a depth that cannot be", OneIcon(Bitmap("0300", "00")), Status::DamagedFile, "", ""},
@@ -53,9 +56,10 @@ TEST(IcoRead, Entries) {
 }
 
 TEST(IcoRead, TheLargestThenDeepestEntryWinsAndPagesSelect) {
-  const std::string small = "28000000 01000000 02000000 0100 1800 00000000 00000000 00000000 00000000 00000000 00000000 "
-                            "0A0B0C 00 00000000 ";                                           // 48 bytes
-  const std::string shallow = Bitmap("0100", "00000000 FFFFFF00  40000000  00000000 ");      // 56 bytes
+  const std::string small =
+      "28000000 01000000 02000000 0100 1800 00000000 00000000 00000000 00000000 00000000 00000000 "
+      "0A0B0C 00 00000000 ";                                                             // 48 bytes
+  const std::string shallow = Bitmap("0100", "00000000 FFFFFF00  40000000  00000000 ");  // 56 bytes
   const std::string deep = Bitmap("1800", "010203 040506 0000  00000000 ");
   TemporaryFolder folder;
   WriteBytes(folder.Path("a.cur"), Hex("0000 0200 0300  01 01 00 00 0000 0000 30000000 36000000 "

@@ -20,9 +20,7 @@ using Bytes = std::vector<uint8_t>;
 
 constexpr size_t kRow = 72, kRows = 720, kHeader = 512, kMacBinary = 128;
 
-Bytes Times(size_t count, uint8_t value) {
-  return Bytes(count, value);
-}
+Bytes Times(size_t count, uint8_t value) { return Bytes(count, value); }
 // A row of 72 different bytes.
 Bytes Counting(int first, int step) {
   Bytes row;
@@ -53,8 +51,7 @@ TEST(Mac, PacksRows) {
   } rows[] = {
       {"equal throughout", Times(72, 0x00), Hex("B9 FF")},
       {"a pair is a run, a single byte is not", Join({Hex("01 01 02"), Times(69, 0x03)}), Hex("FF FE  00 FD  BC FC")},
-      {"literals in one block, also up to the end", Join({Times(68, 0xF0), Hex("00 01 02 03")}),
-       Hex("BD 0F  03 FF FE FD FC")},
+      {"literals in one block, also up to the end", Join({Times(68, 0xF0), Hex("00 01 02 03")}), Hex("BD 0F  03 FF FE FD FC")},
       {"the last two equal", Join({Times(70, 0x10), Hex("00 00")}), Hex("BB EF  FF FF")},
       {"nothing equal", Counting(0x00, 1), Join({Hex("47"), Counting(0xFF, -1)})},
   };
@@ -238,8 +235,7 @@ TEST(Mac, AgreesWithNetpbm) {
     for (size_t i = 0; i < pnm.values.size(); ++i) {
       ASSERT_EQ(pnm.values[i], 1 - picture->image.PixelAt(int32_t(i % 576), int32_t(i / 576))) << i;
     }
-    ASSERT_TRUE(RunShell("pbmtomacp -norle " + seen + " > " + theirs) ||
-                RunShell("pbmtomacp " + seen + " > " + theirs));
+    ASSERT_TRUE(RunShell("pbmtomacp -norle " + seen + " > " + theirs) || RunShell("pbmtomacp " + seen + " > " + theirs));
     const PicturePointer again = NewPictureRecord();
     ASSERT_EQ(ReadFile(theirs, *again), Status::Ok);
     EXPECT_EQ(RowsOf(again->image), RowsOf(picture->image));

@@ -3,8 +3,8 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include "support/hex.h"
 #include "support/codecs.h"
+#include "support/hex.h"
 
 namespace fotomill::test {
 namespace {
@@ -62,8 +62,7 @@ TEST(PcxRead, Lines) {
       {"4 bits in one plane", Pcx({3, 1, 4, 1, 2}, "12 30"), Status::Ok, "1 2 3"},
       {"2 bits in one plane", Pcx({5, 1, 2, 1, 2}, "1B C1 C0"), Status::Ok, "0 1 2 3 3"},
       {"2 bits, lines too short", Pcx({6, 1, 2, 1, 1}, "1B"), Status::Ok, "0 1 2 3 0 0"},
-      {"24 bits, runs over the planes", Pcx({2, 2, 8, 3, 2}, "01 C4 02 03  C6 09"), Status::Ok,
-       "010202 020203 / 090909 090909"},
+      {"24 bits, runs over the planes", Pcx({2, 2, 8, 3, 2}, "01 C4 02 03  C6 09"), Status::Ok, "010202 020203 / 090909 090909"},
       {"24 bits, lines too short", Pcx({2, 1, 8, 3, 1}, "01 02 03"), Status::Ok, "010203 000000"},
       {"ends before a line is full", Pcx({3, 1, 8, 1, 3}, "01 02"), Status::FileReadError, ""},
       {"ends between count and byte", Pcx({3, 1, 8, 1, 3}, "01 C2"), Status::FileReadError, ""},
@@ -206,8 +205,7 @@ TEST(PcxWrite, WholeFiles) {
   const Row rows[] = {
       {"1 bit",
        OneRow({1, 0, 1, 1, 1, 1, 1, 1, 1}, 1),
-       Hex("0A 05 01 01  0000 0000 0800 0000  2C01 2C01  000000 FFFFFF" + std::string(84, '0') + "00 01 0200 0100" +
-           zeros),
+       Hex("0A 05 01 01  0000 0000 0800 0000  2C01 2C01  000000 FFFFFF" + std::string(84, '0') + "00 01 0200 0100" + zeros),
        Hex("BF 80"),
        {}},
       {"2 bits in 2 planes",
@@ -222,8 +220,8 @@ TEST(PcxWrite, WholeFiles) {
        Hex("0A 05 01 01  0000 0000 0800 0000"),
        Hex("88 00 48 00 28 00 18 80"),
        {}},
-      {"7 bits in one plane, odd line", OneRow({1, 2, 127}, 7), Hex("0A 05 01 08  0000 0000 0200 0000"),
-       Hex("01 02 7F"), Hex("0C 000000 000055 0000AA")},
+      {"7 bits in one plane, odd line", OneRow({1, 2, 127}, 7), Hex("0A 05 01 08  0000 0000 0200 0000"), Hex("01 02 7F"),
+       Hex("0C 000000 000055 0000AA")},
       {"24 bits",
        OneRow({1, 2}, 24),
        Hex("0A 05 01 08  0000 0000 0100 0000  2C01 2C01  000000 000055 0000AA 0000FF 002400 002455 0024AA 0024FF"
@@ -238,8 +236,7 @@ TEST(PcxWrite, WholeFiles) {
     ASSERT_EQ(file.size(), 128 + row.tokens.size() + (row.trailer.empty() ? 0 : 769));
     EXPECT_THAT(std::span(file).first(row.begin.size()), ElementsAreArray(row.begin));
     EXPECT_THAT(std::span(file).subspan(128, row.tokens.size()), ElementsAreArray(row.tokens));
-    EXPECT_THAT(std::span(file).subspan(128 + row.tokens.size()).first(row.trailer.size()),
-                ElementsAreArray(row.trailer));
+    EXPECT_THAT(std::span(file).subspan(128 + row.tokens.size()).first(row.trailer.size()), ElementsAreArray(row.trailer));
   }
 }
 

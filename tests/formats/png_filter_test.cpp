@@ -12,14 +12,10 @@ uint8_t Predicted(PngFilter filter, int left, int above, int corner) {
   const int estimate = left + above - corner;
   const int distances[] = {std::abs(estimate - left), std::abs(estimate - above), std::abs(estimate - corner)};
   switch (filter) {
-    case PngFilter::None:
-      return 0;
-    case PngFilter::Sub:
-      return static_cast<uint8_t>(left);
-    case PngFilter::Up:
-      return static_cast<uint8_t>(above);
-    case PngFilter::Average:
-      return static_cast<uint8_t>((left + above) / 2);
+    case PngFilter::None: return 0;
+    case PngFilter::Sub: return static_cast<uint8_t>(left);
+    case PngFilter::Up: return static_cast<uint8_t>(above);
+    case PngFilter::Average: return static_cast<uint8_t>((left + above) / 2);
     case PngFilter::Paeth:
       if (distances[0] <= distances[1] && distances[0] <= distances[2]) return static_cast<uint8_t>(left);
       return static_cast<uint8_t>(distances[1] <= distances[2] ? above : corner);
@@ -27,8 +23,7 @@ uint8_t Predicted(PngFilter filter, int left, int above, int corner) {
   return 0;
 }
 
-std::vector<uint8_t> Filtered(PngFilter filter, const std::vector<uint8_t>& row, const std::vector<uint8_t>& above,
-                              size_t step) {
+std::vector<uint8_t> Filtered(PngFilter filter, const std::vector<uint8_t>& row, const std::vector<uint8_t>& above, size_t step) {
   std::vector<uint8_t> result;
   for (size_t i = 0; i < row.size(); ++i) {
     const bool first = i < step;
@@ -63,8 +58,7 @@ TEST(PngFilter, UndoesAndChoosesAsDefined) {
         std::vector<uint8_t> roomyAbove = above;
         roomyAbove.resize(filtered.size());
         ASSERT_TRUE(UndoPngFilter(number, filtered.data(), roomyAbove.data(), row.size(), step));
-        EXPECT_EQ(std::vector<uint8_t>(filtered.begin() + row.size(), filtered.end()),
-                  std::vector<uint8_t>(kPngSlack, 0xEE));
+        EXPECT_EQ(std::vector<uint8_t>(filtered.begin() + row.size(), filtered.end()), std::vector<uint8_t>(kPngSlack, 0xEE));
         filtered.resize(row.size());
         EXPECT_EQ(filtered, row) << "filter " << int{number};
       }

@@ -21,17 +21,17 @@ TEST(TgaRead, Kinds) {
     const char* alpha;
   };
   const Row rows[] = {
-      {"24 bits from the bottom", "00 00 02 0000 0000 00 0000 0000 0100 0200 18 00  010203 040506", Status::Ok,
-       "060504 / 030201", ""},
+      {"24 bits from the bottom", "00 00 02 0000 0000 00 0000 0000 0100 0200 18 00  010203 040506", Status::Ok, "060504 / 030201",
+       ""},
       {"24 bits from the top right", "00 00 02 0000 0000 00 0000 0000 0200 0100 18 30  010203 040506", Status::Ok,
        "060504 030201", ""},
-      {"32 bits with alpha", "00 00 02 0000 0000 00 0000 0000 0200 0100 20 08  01020380 04050600", Status::Ok,
-       "030201 060504", "128 0"},
+      {"32 bits with alpha", "00 00 02 0000 0000 00 0000 0000 0200 0100 20 08  01020380 04050600", Status::Ok, "030201 060504",
+       "128 0"},
       {"32 bits whose alpha is unset everywhere", "00 00 02 0000 0000 00 0000 0000 0100 0100 20 08  01020300", Status::Ok,
        "030201", ""},
       {"32 bits without attribute bits", "00 00 02 0000 0000 00 0000 0000 0100 0100 20 00  01020380", Status::Ok, "030201", ""},
-      {"16 bits with one of alpha", "00 00 02 0000 0000 00 0000 0000 0200 0100 10 01  00FC E003", Status::Ok,
-       "FF0000 00FF00", "255 0"},
+      {"16 bits with one of alpha", "00 00 02 0000 0000 00 0000 0000 0200 0100 10 01  00FC E003", Status::Ok, "FF0000 00FF00",
+       "255 0"},
       {"grey", "00 00 03 0000 0000 00 0000 0000 0200 0100 08 00  10 20", Status::Ok, "16 32", ""},
       {"grey and alpha", "00 00 03 0000 0000 00 0000 0000 0100 0100 10 08  10 20", Status::Ok, "101010", "32"},
       {"identification text, map that starts at 2", "02 01 01 0200 0200 18 0000 0000 0200 0100 08 00  4141  0000FF 00FF00  02 03",
@@ -61,8 +61,7 @@ TEST(TgaWrite, Layouts) {
   SetPixel(picture->image, 0, 0, 0xFF8040);
   SetPixel(picture->image, 1, 0, 0x0000FF);
   const std::string footer = "00000000 00000000 54525545564953494F4E2D5846494C45 2E00";
-  EXPECT_EQ(Encode(TgaWrite, *picture),
-            Hex("00 00 02 0000 0000 00 00000000 0200 0100 18 00  4080FF FF0000 " + footer));
+  EXPECT_EQ(Encode(TgaWrite, *picture), Hex("00 00 02 0000 0000 00 00000000 0200 0100 18 00  4080FF FF0000 " + footer));
   settings.CreateTarga16 = 1;
   EXPECT_EQ(Encode(TgaWrite, *picture), Hex("00 00 02 0000 0000 00 00000000 0200 0100 10 00  087E 1F00 " + footer));
 }

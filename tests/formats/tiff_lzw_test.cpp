@@ -29,8 +29,7 @@ TEST(TiffLzw, CodesAsDefined) {
 TEST(TiffLzw, EverythingComesBack) {
   TiffLzwEncoder encoder;
   Bytes coded;
-  for (const size_t size :
-       {1, 2, 3, 255, 511, 3838, 3839, 3840, 10000, 70000}) {  // around the ends of tables and widths
+  for (const size_t size : {1, 2, 3, 255, 511, 3838, 3839, 3840, 10000, 70000}) {  // around the ends of tables and widths
     Bytes noise = RandomBytes(size, 5), few = noise, same(size, 9), runs = noise;
     for (size_t i = 0; i < size; ++i) {
       few[i] &= 3;

@@ -87,7 +87,7 @@ TEST(Tiff, BrokenFilesFailWithTheirStatus) {
   std::vector<uint8_t> cut = Page(8, 8, 8, 1, 1, 339, 1, pixels), foreign = cut, loop = cut;
   cut.pop_back();
   foreign[2] = 41;
-  loop[kPageEnd - 4] = 8;  // the next page is the same one
+  loop[kPageEnd - 4] = 8;                                                         // the next page is the same one
   std::vector<uint8_t> bomb = Page(4000000, 1, 8, 1, 60000, 259, 32773, pixels);  // a row of 240 GB, run-length coded
   const Row rows[] = {
       {"last pixel missing", cut, Status::FileReadError},

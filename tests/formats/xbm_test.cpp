@@ -86,8 +86,7 @@ TEST(Xbm, WritesText) {
 }
 
 TEST(Xbm, ReadsText) {
-  const std::string size8 = "#define a_width 8\n#define a_height 1\n",
-                    size16 = "#define a_width 16\n#define a_height 1\n";
+  const std::string size8 = "#define a_width 8\n#define a_height 1\n", size16 = "#define a_width 16\n#define a_height 1\n";
   const std::string bits = "static char a_bits[] = {\n";
   const std::string pad(300, ' ');
   const struct {
@@ -106,24 +105,22 @@ TEST(Xbm, ReadsText) {
       {"values in the line of the bits are lost", size8 + "static char a_bits[] = { 0x01,\n0x80};", 8, 1, Hex("FE")},
       {"line ends of other systems", "#define a_width 8\r\n#define a_height 1\r\nchar a_bits[] = {\r\n0x80};\r\n", 8, 1,
        Hex("FE")},
-      {"tabs, text in front, order", "/* x */ #define  a_height\t\t1\n#define a_width \t8\n" + bits + "0x80", 8, 1,
-       Hex("FE")},
+      {"tabs, text in front, order", "/* x */ #define  a_height\t\t1\n#define a_width \t8\n" + bits + "0x80", 8, 1, Hex("FE")},
       {"sizes may stand behind the values", bits + "0x80\n" + size8, 8, 1, Hex("FE")},
       {"a line with the word alone is no size", "width 3 height 4\n" + size8 + bits + "0x80", 8, 1, Hex("FE")},
       {"a size may be told again until both are known", "#define b_width 9\n" + size8 + bits + "0x80", 8, 1, Hex("FE")},
       {"and not after", size8 + "#define b_width 9\n" + bits + "0x80", 8, 1, Hex("FE")},
-      {"text behind the number", "#define a_width 8pixels\n#define a_height +1 /* x */\n" + bits + "0x80", 8, 1,
-       Hex("FE")},
-      {"the file's padding shows, its first pixels do not",
-       "#define a_width 10\n#define a_height 1\n" + bits + "0x3f, 0xe0", 10, 1, Hex("FE 00")},
-      {"a picture called rabbits",
-       "#define rabbits_width 8\n#define rabbits_height 1\nstatic char rabbits_bits[] = {\n0x80}", 8, 1, Hex("FE")},
+      {"text behind the number", "#define a_width 8pixels\n#define a_height +1 /* x */\n" + bits + "0x80", 8, 1, Hex("FE")},
+      {"the file's padding shows, its first pixels do not", "#define a_width 10\n#define a_height 1\n" + bits + "0x3f, 0xe0", 10,
+       1, Hex("FE 00")},
+      {"a picture called rabbits", "#define rabbits_width 8\n#define rabbits_height 1\nstatic char rabbits_bits[] = {\n0x80}", 8,
+       1, Hex("FE")},
       {"a picture called lineheight", "#define lineheight_width 8\n#define lineheight_height 1\n" + bits + "0x80", 8, 1,
        Hex("FE")},
-      {"a picture called heightwidth", "#define heightwidth_width 8\n#define heightwidth_height 1\n" + bits + "0x80", 8,
-       1, Hex("FE")},
-      {"lines end after 260 characters: the word is cut in two",
-       size8 + std::string(257, ' ') + "bits\n0x01\n" + bits + "0x80", 8, 1, Hex("FE")},
+      {"a picture called heightwidth", "#define heightwidth_width 8\n#define heightwidth_height 1\n" + bits + "0x80", 8, 1,
+       Hex("FE")},
+      {"lines end after 260 characters: the word is cut in two", size8 + std::string(257, ' ') + "bits\n0x01\n" + bits + "0x80",
+       8, 1, Hex("FE")},
       {"and is whole when it ends with the piece", size8 + std::string(256, ' ') + "bits 0x01\n" + bits + "0x80", 8, 1,
        Hex("7F")},
       {"values behind the first 260 characters of the line of the bits count",
@@ -131,11 +128,7 @@ TEST(Xbm, ReadsText) {
       {"one value is missing", size16 + bits + "0x01, 0x", 16, 1, {}},
       {"half a value at the end", size8 + bits + "0x8", 8, 1, {}},
       {"no line of bits", size8 + "static char a_data[] = {\n0x80};", 8, 1, {}},
-      {"more rows than the file can hold",
-       "#define a_width 8\n#define a_height 2147483647\n" + bits + "0x80",
-       8,
-       INT32_MAX,
-       {}},
+      {"more rows than the file can hold", "#define a_width 8\n#define a_height 2147483647\n" + bits + "0x80", 8, INT32_MAX, {}},
   };
   const TemporaryFolder folder;
   const std::string path = folder.Path("text.xbm");
@@ -246,8 +239,7 @@ TEST(Xbm, AgreesWithNetpbmAtWholeBytes) {
 
 TEST(Xbm, ReadsTheBitmapsOfXAsNetpbmDoes) {
   const char* const bitmaps = "/usr/include/X11/bitmaps";
-  if (!HasProgram("xbmtopbm") || !std::filesystem::is_directory(bitmaps))
-    GTEST_SKIP() << "netpbm or xbitmaps is missing";
+  if (!HasProgram("xbmtopbm") || !std::filesystem::is_directory(bitmaps)) GTEST_SKIP() << "netpbm or xbitmaps is missing";
   const TemporaryFolder folder;
   const std::string seen = folder.Path("seen.pbm");
   int compared = 0;

@@ -15,10 +15,14 @@
 namespace fotomill::test {
 namespace {
 
-const char* const kCameras[] = {"Canon_40D", "Canon_DIGITAL_IXUS_400", "DSCN0010", "Fujifilm_FinePix6900ZOOM",
-                                "JVC",       "Kodak_CX7530",           "Minolta",  "Motorola",
-                                "Nikon_D70", "Olympus_C8080WZ",        "GPS",      "Panasonic_DMC-FZ30",
-                                "Pentax",    "Ricoh",                  "Sanyo",    "Sony_HDR-HC3"};
+const char* const kCameras[] = {"Canon_40D", "Canon_DIGITAL_IXUS_400",
+                                "DSCN0010",  "Fujifilm_FinePix6900ZOOM",
+                                "JVC",       "Kodak_CX7530",
+                                "Minolta",   "Motorola",
+                                "Nikon_D70", "Olympus_C8080WZ",
+                                "GPS",       "Panasonic_DMC-FZ30",
+                                "Pentax",    "Ricoh",
+                                "Sanyo",     "Sony_HDR-HC3"};
 
 class TextsByTag : public ExifSink {
  public:

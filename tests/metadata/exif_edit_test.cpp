@@ -34,9 +34,12 @@ TEST(ExifEdit, ReadsTheOrientation) {
     std::vector<BlockBuilder::Entry> entries;
     int32_t orientation;
   } rows[] = {
-      {"none", {{0x0100, 3, 1, 6}}, 1},   {"0", {{0x0112, 3, 1, 0}}, 1},
-      {"9", {{0x0112, 3, 1, 9}}, 1},      {"as LONG", {{0x0112, 4, 1, 8}}, 8},
-      {"as BYTE", {{0x0112, 1, 1, 5}}, 5}, {"first of two", {kOrientation6, {0x0112, 3, 1, 2}}, 6},
+      {"none", {{0x0100, 3, 1, 6}}, 1},
+      {"0", {{0x0112, 3, 1, 0}}, 1},
+      {"9", {{0x0112, 3, 1, 9}}, 1},
+      {"as LONG", {{0x0112, 4, 1, 8}}, 8},
+      {"as BYTE", {{0x0112, 1, 1, 5}}, 5},
+      {"first of two", {kOrientation6, {0x0112, 3, 1, 2}}, 6},
       {"far away", {{0x0112, 3, 3, 0x7fffffff}}, 1},
   };
   for (const auto& row : rows) {
@@ -121,9 +124,9 @@ TEST(ExifEdit, ReplacesTheThumbnail) {
 }
 
 TEST(ExifEdit, LeavesAloneWhatIsNoBlock) {
-  for (const char* hex : {"", "4949", "4949 2B00 08000000 0100 0001 0300 01000000 05000000 00000000",
-                          "4949 2A00 00000000", "4949 2A00 08000000", "4949 2A00 08000000 0000 00000000",
-                          "4949 2A00 FEFFFFFF 0100", "4949 2A00 04000000 0100 0001 0300 01000000 05000000 00000000"}) {
+  for (const char* hex : {"", "4949", "4949 2B00 08000000 0100 0001 0300 01000000 05000000 00000000", "4949 2A00 00000000",
+                          "4949 2A00 08000000", "4949 2A00 08000000 0000 00000000", "4949 2A00 FEFFFFFF 0100",
+                          "4949 2A00 04000000 0100 0001 0300 01000000 05000000 00000000"}) {
     SCOPED_TRACE(hex);
     Bytes block = Hex(hex);
     SetExifPictureFacts(block, {1, 1, 1});

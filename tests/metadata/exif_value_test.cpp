@@ -112,11 +112,17 @@ TEST(ExifValue, DecodesUserComments) {
     size_t most;
     std::string_view text;
   } rows[] = {
-      {"ASCII\0\0\0Hi  "sv, 12, 100, "Hi  "}, {"ASCII\0\0\0Hi\0there"sv, 16, 100, "Hi"},
-      {"ASCII\0\0\0Hello"sv, 10, 100, "He"}, {"ASCII\0\0\0Hello"sv, 13, 3, "Hel"},
-      {"ASCII\0\0\0He"sv, 4000000000, 100, "He"}, {"ASCII\0\0"sv, 7, 100, ""}, {"ASCII\0\0\0Hello"sv, 7, 100, ""},
-      {"JIS\0\0\0\0\0xx"sv, 10, 100, "JIS X208-1990 (not supported)"}, {"JIS X208xx"sv, 10, 100, ""},
-      {"UNICODE\0xx"sv, 10, 100, "Unicode (not supported)"}, {"\0\0\0\0\0\0\0\0xx"sv, 10, 100, ""},
+      {"ASCII\0\0\0Hi  "sv, 12, 100, "Hi  "},
+      {"ASCII\0\0\0Hi\0there"sv, 16, 100, "Hi"},
+      {"ASCII\0\0\0Hello"sv, 10, 100, "He"},
+      {"ASCII\0\0\0Hello"sv, 13, 3, "Hel"},
+      {"ASCII\0\0\0He"sv, 4000000000, 100, "He"},
+      {"ASCII\0\0"sv, 7, 100, ""},
+      {"ASCII\0\0\0Hello"sv, 7, 100, ""},
+      {"JIS\0\0\0\0\0xx"sv, 10, 100, "JIS X208-1990 (not supported)"},
+      {"JIS X208xx"sv, 10, 100, ""},
+      {"UNICODE\0xx"sv, 10, 100, "Unicode (not supported)"},
+      {"\0\0\0\0\0\0\0\0xx"sv, 10, 100, ""},
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(testing::Message() << row.data << ' ' << row.count);

@@ -30,8 +30,8 @@ TEST(ExifWalk, FindsTheSameInBothByteOrders) {
     EXPECT_EQ(all.lines, LinesOf(LittleEndianBlock()));
     EXPECT_THAT(all.numbers, ElementsAre(0, 1, 2, 3));
     EXPECT_TRUE(WalkExif(block, &one, nullptr, 1));
-    EXPECT_THAT(one.lines, ElementsAre("DIRECTORY IFD 1", "Compression scheme=JPEG", "Offset to JPEG SOI=122",
-                                       "Bytes of JPEG data=4"));
+    EXPECT_THAT(one.lines,
+                ElementsAre("DIRECTORY IFD 1", "Compression scheme=JPEG", "Offset to JPEG SOI=122", "Bytes of JPEG data=4"));
     EXPECT_EQ(findings.exifOffset, 0x7eu);
     EXPECT_EQ(findings.gpsOffset, 0xb0u);
     EXPECT_THAT(ExifThumbnail(block, findings), ElementsAre(0xff, 0xd8, 0xff, 0xd9));
@@ -64,15 +64,15 @@ const Trap kTraps[] = {
     {"EXIF pointer back to the first directory", {{{{kExif, 4, 1, 8}}, 0}}, {"DIRECTORY IFD 0", "Exif tag=8"}},
     {"only the first EXIF pointer counts, and GPS alone comes last",
      {{{{kExif, 4, 1, 50}, {kExif, 4, 1, 8}, {kGps, 4, 1, 68}}, 0}, {{{kWidth, 4, 1, 70000}}, 0}, {{{5, 1, 1, 1}}, 0}},
-     {"DIRECTORY IFD 0", "Exif tag=50", "Exif tag=8", "GPS tag=68", "DIRECTORY EXIF", "Image width=70000",
-      "DIRECTORY GPS", "Altitude reference=Sea level reference"}},
+     {"DIRECTORY IFD 0", "Exif tag=50", "Exif tag=8", "GPS tag=68", "DIRECTORY EXIF", "Image width=70000", "DIRECTORY GPS",
+      "Altitude reference=Sea level reference"}},
     {"a directory chained behind EXIF keeps the running number",
      {{{{kExif, 4, 1, 26}}, 0}, {{{kWidth, 3, 1, 1}}, 44}, {{{kWidth, 3, 1, 2}}, 0}},
      {"DIRECTORY IFD 0", "Exif tag=26", "DIRECTORY EXIF", "Image width=1", "DIRECTORY IFD 2", "Image width=2"}},
     {"values beyond the block are zero",
      {{{{0x011a, 5, 1, 0xffffffff}, {0x010f, 2, 0xffffffff, 0xfffffff0}, {0x0111, 4, 0xffffffff, 0x7fffffff}}, 0}},
-     {"DIRECTORY IFD 0", "Image resolution for width=0.000", "Image input equipment manufacturer=",
-      "Image data location=0 0 0 0 0 0 0 0 0 0 0 0 0 0 0 0 ..."}},
+     {"DIRECTORY IFD 0", "Image resolution for width=0.000",
+      "Image input equipment manufacturer=", "Image data location=0 0 0 0 0 0 0 0 0 0 0 0 0 0 0 0 ..."}},
 };
 
 TEST(ExifWalk, StaysInsideHostileBlocks) {

@@ -66,9 +66,7 @@ TEST(FindFormat, FirstRowThatMatchesWins) {
 TEST(FindFormat, PlugInsAreAskedLastAndListedLast) {
   const size_t filter = OpenFileFilter().size(), destinations = DestinationExtensions().size();
   constexpr PluginSource kSource{
-      [](std::string_view name, int32_t parameter) {
-        return name == "x.heic" && parameter == 5 ? kSpareRow : kNoFormat;
-      },
+      [](std::string_view name, int32_t parameter) { return name == "x.heic" && parameter == 5 ? kSpareRow : kNoFormat; },
       [] {
         return std::vector<PluginFormatFacts>{{"HEIC", "", 24, false}, {"QOI", "Quite OK", 24, true}};
       }};
@@ -135,9 +133,8 @@ TEST(WritePicture, RefusesInOrder) {
     int32_t bits;
     Status status;
   } rows[] = {
-      {"x.abc", 24, Status::UnsupportedFormat},      {"x.gif", 24, Status::TooManyColors},
-      {"x.mac", 8, Status::TooManyColors},           {"x.cdr", 24, Status::UnsupportedFunction},
-      {"x.cut", 24, Status::TooManyColors},          {"x.pcx", 24, Status::Ok},
+      {"x.abc", 24, Status::UnsupportedFormat},      {"x.gif", 24, Status::TooManyColors}, {"x.mac", 8, Status::TooManyColors},
+      {"x.cdr", 24, Status::UnsupportedFunction},    {"x.cut", 24, Status::TooManyColors}, {"x.pcx", 24, Status::Ok},
       {"none/x.pcx", 24, Status::ErrorCreatingFile},
   };
   for (const auto& row : rows) {
@@ -214,8 +211,7 @@ TEST(Registry, RowsKeepTheirPromises) {
     EXPECT_TRUE(row.info != nullptr && row.read != nullptr && row.write != nullptr);
     EXPECT_TRUE(row.maxBits == 1 || row.maxBits == 8 || row.maxBits == 24);
     EXPECT_EQ((row.flags & FMT_SECONDARY) != 0, i >= 41);
-    EXPECT_EQ((row.flags & FMT_MULTI) != 0,
-              (row.flags & FMT_PAGES) != 0 || i == 0 || i == 36 || i == 41 || i == 48 || i == 49);
+    EXPECT_EQ((row.flags & FMT_MULTI) != 0, (row.flags & FMT_PAGES) != 0 || i == 0 || i == 36 || i == 41 || i == 48 || i == 49);
     EXPECT_EQ(CanRead(row) && CanWrite(row), WhyNot(row).empty());
   }
 }

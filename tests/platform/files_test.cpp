@@ -120,7 +120,8 @@ TEST_F(FilesTest, FactsTellSizeTimesAndIdentity) {
 
 TEST(Files, ListingKeepsAnyNameInByteOrder) {
   const TemporaryFolder folder;
-  const std::vector<std::string> names = {"\nnew line", " blank", "\"quoted\"", "--help", ".hidden", "B", "a", "a\\b", "\xC3\xA9", "\xFF\xFE"};
+  const std::vector<std::string> names = {"\nnew line", " blank", "\"quoted\"", "--help",   ".hidden",
+                                          "B",          "a",      "a\\b",       "\xC3\xA9", "\xFF\xFE"};
   for (const std::string& name : names) WriteText(folder.Path(name), "");
   std::vector<std::string> listed;
   const std::vector<FolderEntry> entries = ListFolder(folder.Path()).value();
@@ -147,7 +148,8 @@ TEST_F(FilesTest, MakesFoldersWithTheirParents) {
 
 TEST_F(FilesTest, DeletesFilesAndLinksNeverFolders) {
   for (const char* name : {"folder", "nothing", "regular/x"}) EXPECT_FALSE(DeleteFile(Path(name))) << name;
-  for (const char* name : {"to folder", "to nothing", "to regular", "fifo", "circle"}) EXPECT_TRUE(DeleteFile(Path(name))) << name;
+  for (const char* name : {"to folder", "to nothing", "to regular", "fifo", "circle"})
+    EXPECT_TRUE(DeleteFile(Path(name))) << name;
   EXPECT_THAT(folder_.Names(), ElementsAre("folder", "regular"));
 }
 
@@ -194,7 +196,8 @@ TEST(Files, OneWinsARaceForAName) {
     CommitResult results[kRunners];
     std::vector<std::thread> runners;
     for (int i = 0; i < kRunners; ++i) {
-      runners.emplace_back([&, i] { results[i] = RenameFile(folder.Path(std::to_string(i)), folder.Path("name"), Existing::Refuse); });
+      runners.emplace_back(
+          [&, i] { results[i] = RenameFile(folder.Path(std::to_string(i)), folder.Path("name"), Existing::Refuse); });
     }
     for (std::thread& runner : runners) runner.join();
     EXPECT_EQ(std::count(results, results + kRunners, CommitResult::Done), 1);
@@ -232,9 +235,9 @@ TEST_F(FilesTest, ReadsWholeSmallFiles) {
     uint64_t most;
     ReadResult result;
   } rows[] = {
-      {"regular", 5, ReadResult::Done},       {"regular", 4, ReadResult::TooLarge},  {"regular", UINT64_MAX, ReadResult::Done},
-      {"to regular", 9, ReadResult::Done},    {"nothing", 9, ReadResult::Missing},   {"none/x", 9, ReadResult::Missing},
-      {"to nothing", 9, ReadResult::Failed},  {"folder", 9, ReadResult::Failed},     {"fifo", 9, ReadResult::Failed},
+      {"regular", 5, ReadResult::Done},      {"regular", 4, ReadResult::TooLarge}, {"regular", UINT64_MAX, ReadResult::Done},
+      {"to regular", 9, ReadResult::Done},   {"nothing", 9, ReadResult::Missing},  {"none/x", 9, ReadResult::Missing},
+      {"to nothing", 9, ReadResult::Failed}, {"folder", 9, ReadResult::Failed},    {"fifo", 9, ReadResult::Failed},
       {"circle", 9, ReadResult::Failed},
   };
   for (const auto& row : rows) {

@@ -72,8 +72,8 @@ TEST(Folders, PathsBecomeAbsolute) {
   const struct {
     const char *path, *expected;
   } rows[] = {
-      {"/", "/"},         {"//", "/"},          {"/a/./b/../c/", "/a/c"}, {"/../..", "/"}, {"/a//b", "/a/b"},
-      {"/a/...", "/a/..."}, {"/a/..", "/"}, {"/-x\n/.y", "/-x\n/.y"},
+      {"/", "/"},        {"//", "/"},          {"/a/./b/../c/", "/a/c"}, {"/../..", "/"},
+      {"/a//b", "/a/b"}, {"/a/...", "/a/..."}, {"/a/..", "/"},           {"/-x\n/.y", "/-x\n/.y"},
   };
   for (const auto& row : rows) EXPECT_EQ(AbsolutePath(row.path), row.expected) << row.path;
   const std::string current = CurrentFolder();

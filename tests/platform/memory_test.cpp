@@ -70,7 +70,8 @@ TEST(MemoryBlock, WhatCannotBeHadFails) {
   }
   EXPECT_EQ(test::ForEachFault([] {
               MemoryBlock block;
-              const bool done = block.Allocate(5 * kMega) && block.Resize(4 * kMega) && block.Resize(20 * kMega) && block.Resize(10);
+              const bool done =
+                  block.Allocate(5 * kMega) && block.Resize(4 * kMega) && block.Resize(20 * kMega) && block.Resize(10);
               EXPECT_EQ(done, faultCountdown > 0);
             }),
             4);

@@ -46,7 +46,8 @@ CommitResult WriteAs(const std::string& path, std::string_view text, Existing ex
 }
 
 TEST_P(OutputFileTest, AppearsWholeUnderAnyName) {
-  const std::vector<std::string> names = {"\nline\n", " ", "\"'`$", "--out", ".hidden", "a", "a.b.c", "back\\slash", std::string(255, 'n'), "\xFF\xFE.bmp"};
+  const std::vector<std::string> names = {
+      "\nline\n", " ", "\"'`$", "--out", ".hidden", "a", "a.b.c", "back\\slash", std::string(255, 'n'), "\xFF\xFE.bmp"};
   for (const std::string& name : names) {
     OutputFile file;
     ASSERT_TRUE(file.Create(Path(name)));
@@ -105,7 +106,8 @@ TEST_P(OutputFileTest, PermissionsFollowTheMaskOrTheOldFile) {
   const struct {
     const char* name;
     mode_t old, expected;  // old 0: a new file
-  } rows[] = {{"new", 0, 0640}, {"private", 0600, 0600}, {"shared", 0666, 0666}, {"program", 0755, 0755}, {"special", 06711, 0711}};
+  } rows[] = {
+      {"new", 0, 0640}, {"private", 0600, 0600}, {"shared", 0666, 0666}, {"program", 0755, 0755}, {"special", 06711, 0711}};
   for (const auto& row : rows) {
     if (row.old != 0) {
       WriteText(Path(row.name), "old");

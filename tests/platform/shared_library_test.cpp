@@ -53,8 +53,14 @@ TEST(SharedLibrary, RefusesWhatIsNoModule) {
   fs::create_directory(folder.Path("folder.so"));
   ASSERT_EQ(mkfifo(folder.Path("fifo.so").c_str(), 0600), 0);
   SharedLibrary library;
-  const std::string paths[] = {folder.Path("text.so"), folder.Path("empty.so"),   folder.Path("folder.so"), folder.Path("fifo.so"),
-                               folder.Path("missing"), fs::path(LoadedFile("/libm.so")).filename(), "./text.so", ""};
+  const std::string paths[] = {folder.Path("text.so"),
+                               folder.Path("empty.so"),
+                               folder.Path("folder.so"),
+                               folder.Path("fifo.so"),
+                               folder.Path("missing"),
+                               fs::path(LoadedFile("/libm.so")).filename(),
+                               "./text.so",
+                               ""};
   for (const std::string& path : paths) {
     EXPECT_FALSE(library.Load(path)) << path;
     EXPECT_NE(library.Error(), "") << path;

@@ -154,7 +154,8 @@ TEST(StoreFile, EveryOperationMayFail) {
               const OpenResult opened = file.Open(path, Mode::CreateNew);
               EXPECT_EQ(FileExists(path), opened == OpenResult::Done);
               uint8_t byte[1] = {7};
-              const bool done = opened == OpenResult::Done && file.Lock() && file.WriteAt(0, byte) && file.Sync() && file.ReadAt(0, byte);
+              const bool done =
+                  opened == OpenResult::Done && file.Lock() && file.WriteAt(0, byte) && file.Sync() && file.ReadAt(0, byte);
               EXPECT_EQ(done, faultCountdown > 0);
             }),
             5);

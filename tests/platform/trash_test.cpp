@@ -49,8 +49,9 @@ TEST_F(TrashTest, RemembersWhereAndWhen) {
   ASSERT_TRUE(MoveToTrash(Picture(name)));
   EXPECT_FALSE(FileExists(Picture(name)));
   EXPECT_EQ(ReadText(Trash("files/" + name)), "pixels");
-  EXPECT_EQ(ReadText(Trash("info/" + name + ".trashinfo")),
-            "[Trash Info]\nPath=" + folder_.Path("pictures") + "/100%25%20%22a%22%0A%C3%A9%FF.bmp\nDeletionDate=2000-02-29T01:59:59\n");
+  EXPECT_EQ(
+      ReadText(Trash("info/" + name + ".trashinfo")),
+      "[Trash Info]\nPath=" + folder_.Path("pictures") + "/100%25%20%22a%22%0A%C3%A9%FF.bmp\nDeletionDate=2000-02-29T01:59:59\n");
   EXPECT_EQ(fs::status(Trash("")).permissions(), fs::perms::owner_all);
 }
 
@@ -107,7 +108,8 @@ TEST_F(TrashTest, TakesFoldersLinksAndLongNames) {
 
 TEST_F(TrashTest, LeavesNothingBehindWhenItCannot) {
   const std::vector<std::string> before = folder_.Names();
-  for (const std::string& path : {Picture("missing"), Picture("no/such"), Picture("."), Picture(".."), std::string("/"), std::string()}) {
+  for (const std::string& path :
+       {Picture("missing"), Picture("no/such"), Picture("."), Picture(".."), std::string("/"), std::string()}) {
     EXPECT_FALSE(MoveToTrash(path)) << path;
     EXPECT_FALSE(HasTrash(path)) << path;
   }
@@ -158,7 +160,8 @@ TEST_F(TrashTest, AnotherVolumeHasItsOwn) {
       WriteText(Picture(std::string("sub/") + name), name);
       return HasTrash(Picture(std::string("sub/") + name)) && MoveToTrash(Picture(std::string("sub/") + name)) &&
              ReadText(Picture(trash + "/files/" + name)) == name &&
-             ReadText(Picture(trash + "/info/" + name + ".trashinfo")).find("\nPath=sub/" + std::string(name) + "\n") != std::string::npos;
+             ReadText(Picture(trash + "/info/" + name + ".trashinfo")).find("\nPath=sub/" + std::string(name) + "\n") !=
+                 std::string::npos;
     };
     check(gone("a", own));
     fs::create_directory(Picture(".Trash"));

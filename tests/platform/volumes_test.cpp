@@ -75,14 +75,10 @@ TEST_F(MountTest, EveryMountIsDescribed) {
     uint32_t serial;  // 0: what it is does not matter, as long as it is not the stand-in
     DriveKind kind;
   } rows[] = {
-      {22, "/dev/sda2", "", 0, DriveKind::Fixed},
-      {36, "/dev/sdb1", "MY STICK/\xC3\xA9", 0x1A2B3C4D, DriveKind::Removable},
-      {37, "server:/a b", "", 99, DriveKind::Network},
-      {38, "/dev/mapper/vg-data", "data", 0, DriveKind::Fixed},
-      {39, "/dev/sr0", "DISC", 99, DriveKind::Optical},
-      {40, "tmpfs", "", 99, DriveKind::Ram},
-      {41, "odd", "", 99, DriveKind::Unknown},
-      {42, "/dev/nvme0n1p5", "", 0xFEEDBEEF, DriveKind::Fixed},
+      {22, "/dev/sda2", "", 0, DriveKind::Fixed},       {36, "/dev/sdb1", "MY STICK/\xC3\xA9", 0x1A2B3C4D, DriveKind::Removable},
+      {37, "server:/a b", "", 99, DriveKind::Network},  {38, "/dev/mapper/vg-data", "data", 0, DriveKind::Fixed},
+      {39, "/dev/sr0", "DISC", 99, DriveKind::Optical}, {40, "tmpfs", "", 99, DriveKind::Ram},
+      {41, "odd", "", 99, DriveKind::Unknown},          {42, "/dev/nvme0n1p5", "", 0xFEEDBEEF, DriveKind::Fixed},
       {43, "/dev/sdc1", "", 99, DriveKind::Fixed},
   };
   const std::vector<Mount> mounts = ParseMountTable(mountTable);

@@ -33,10 +33,7 @@ TEST_F(Plugins, ModulesAreRegisteredOrSkipped) {
     std::vector<std::string> extensions;
   };
   const Row rows[] = {
-      {"REFUSES", {}},
-      {"NO_INFO_EXPORT", {}},
-      {"GAPS_IN_LIST", {"abc", "def"}},
-      {"UNTERMINATED_TEXTS", {"odd"}},
+      {"REFUSES", {}},        {"NO_INFO_EXPORT", {}}, {"GAPS_IN_LIST", {"abc", "def"}}, {"UNTERMINATED_TEXTS", {"odd"}},
       {"missing folder", {}},
   };
   for (const Row& row : rows) {
@@ -101,9 +98,8 @@ TEST_F(Plugins, WhatAModuleReturnsIsChecked) {
     Status status;
   };
   const Row rows[] = {
-      {"GARBAGE_SIZES", Status::DamagedFile},  {"ERROR_NUMBER", Status::InvalidPassword},
-      {"SMALL_BLOCK", Status::DamagedFile},    {"WRONG_DEPTH", Status::UnsupportedFormat},
-      {"EMPTY_RESULT", Status::DamagedFile},   {"HALF_WRITER", Status::Ok},
+      {"GARBAGE_SIZES", Status::DamagedFile},     {"ERROR_NUMBER", Status::InvalidPassword}, {"SMALL_BLOCK", Status::DamagedFile},
+      {"WRONG_DEPTH", Status::UnsupportedFormat}, {"EMPTY_RESULT", Status::DamagedFile},     {"HALF_WRITER", Status::Ok},
   };
   const std::string file = folder_.Path("x.odd");
   test::WriteText(file, "anything");

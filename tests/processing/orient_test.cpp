@@ -22,9 +22,8 @@ TEST(Orient, TheLetterFStandsUpright) {
   };
   for (const Row& row : rows) {
     SCOPED_TRACE(row.orientation);
-    const PicturePointer picture = MakePicture(row.width, 6 / row.width, [&](int32_t x, int32_t y) {
-      return row.stored[static_cast<size_t>(y * row.width + x)];
-    });
+    const PicturePointer picture = MakePicture(
+        row.width, 6 / row.width, [&](int32_t x, int32_t y) { return row.stored[static_cast<size_t>(y * row.width + x)]; });
     picture->metadata.dpiX = row.width;
     picture->metadata.dpiY = 6 / row.width;
     ASSERT_EQ(OrientPicture(*picture, static_cast<Orientation>(row.orientation)), Status::Ok);

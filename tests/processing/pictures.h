@@ -12,8 +12,7 @@
 namespace fotomill::test {
 
 // A 24-bit picture whose pixel at column x, row y from the top is colorAt(x, y), 0x00RRGGBB.
-inline PicturePointer MakePicture(int32_t width, int32_t height,
-                                  const std::function<uint32_t(int32_t, int32_t)>& colorAt) {
+inline PicturePointer MakePicture(int32_t width, int32_t height, const std::function<uint32_t(int32_t, int32_t)>& colorAt) {
   PicturePointer picture = NewPictureRecord();
   EXPECT_EQ(NewPackedImage(width, height, nullptr, 24, picture->image), Status::Ok);
   picture->width = width;

@@ -14,9 +14,7 @@ namespace {
 using test::Colors;
 using test::MakePicture;
 
-uint32_t Grey(int32_t level) {
-  return static_cast<uint32_t>(level) * 0x010101u;
-}
+uint32_t Grey(int32_t level) { return static_cast<uint32_t>(level) * 0x010101u; }
 
 PicturePointer Sweep(int32_t width, int32_t height) {
   return MakePicture(width, height, [=](int32_t x, int32_t y) {
@@ -70,8 +68,8 @@ TEST(Reduce, DitheredGreysKeepTheirMean) {
       for (int32_t level = 0; level <= 255; level += 5) {
         SCOPED_TRACE(testing::Message() << level << ", dither " << static_cast<int32_t>(dither));
         // Two pixels of other colours keep the picture from being packed exactly.
-        const PicturePointer picture = MakePicture(
-            128, 128, [level](int32_t x, int32_t y) { return y == 0 && x < 2 ? Grey(100 + x) : Grey(level); });
+        const PicturePointer picture =
+            MakePicture(128, 128, [level](int32_t x, int32_t y) { return y == 0 && x < 2 ? Grey(100 + x) : Grey(level); });
         ReduceOptions options;
         options.monoDither = dither;
         options.serpentine = serpentine;
@@ -111,8 +109,7 @@ TEST(Reduce, ThresholdPartsDarkFromBright) {
 }
 
 TEST(Reduce, AlphaGoesToTheBackgroundFirst) {
-  const PicturePointer picture =
-      MakePicture(20, 20, [](int32_t x, int32_t y) { return test::Scatter(x, y) & 0xffffff; });
+  const PicturePointer picture = MakePicture(20, 20, [](int32_t x, int32_t y) { return test::Scatter(x, y) & 0xffffff; });
   test::AddAlpha(*picture, [](int32_t, int32_t) { return 0; });
   picture->defaultColour = 0x102030;  // blue, green, red
   ASSERT_EQ(ReduceColors(*picture, 8), Status::Ok);
@@ -183,8 +180,7 @@ TEST(Reduce, NearestColorIsNearest) {
       const auto distance = [&](int32_t i, const int32_t(&bgr)[3]) {
         int32_t sum = 0;
         for (int c = 0; c < 3; ++c)
-          sum += kChannelWeight[c] *
-                 static_cast<int32_t>(std::pow(palette[static_cast<size_t>(3 * i + 2 - c)] - bgr[c], 2));
+          sum += kChannelWeight[c] * static_cast<int32_t>(std::pow(palette[static_cast<size_t>(3 * i + 2 - c)] - bgr[c], 2));
         return sum;
       };
       for (int k = 0; k < 4000; ++k) {

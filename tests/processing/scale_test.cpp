@@ -20,8 +20,7 @@ using test::Colors;
 using test::MakePicture;
 using test::Scatter;
 
-constexpr ScaleFilter kFilters[] = {ScaleFilter::Lanczos, ScaleFilter::Bicubic, ScaleFilter::Bilinear,
-                                    ScaleFilter::Nearest};
+constexpr ScaleFilter kFilters[] = {ScaleFilter::Lanczos, ScaleFilter::Bicubic, ScaleFilter::Bilinear, ScaleFilter::Nearest};
 
 TEST(Scale, Sizes) {
   struct Row {
@@ -51,12 +50,15 @@ TEST(Scale, Sizes) {
 }
 
 TEST(Scale, KeysSelectTheFilterThatTheirListNames) {
-  constexpr std::pair<const char*, ScaleFilter> names[] = {{"Lanczos", ScaleFilter::Lanczos}, {"Bicubic", ScaleFilter::Bicubic},
-                                                           {"Bilinear", ScaleFilter::Bilinear}, {"Nearest", ScaleFilter::Nearest}};
+  constexpr std::pair<const char*, ScaleFilter> names[] = {{"Lanczos", ScaleFilter::Lanczos},
+                                                           {"Bicubic", ScaleFilter::Bicubic},
+                                                           {"Bilinear", ScaleFilter::Bilinear},
+                                                           {"Nearest", ScaleFilter::Nearest}};
   const ChoiceEntry* entry = kResampleChoices;
   for (; entry->text != nullptr; ++entry) {
     for (const auto& [name, filter] : names) {
-      EXPECT_EQ(ScaleFilterFromKey(entry->value) == filter, std::string_view(entry->text).starts_with(name)) << entry->text << name;
+      EXPECT_EQ(ScaleFilterFromKey(entry->value) == filter, std::string_view(entry->text).starts_with(name))
+          << entry->text << name;
     }
   }
   EXPECT_EQ(ScaleFilterFromKey(-1), ScaleFilter::Bicubic);
@@ -70,12 +72,10 @@ struct Reference {
     x = std::abs(x);
     const auto sinc = [](double t) { return t == 0 ? 1.0 : std::sin(std::numbers::pi * t) / (std::numbers::pi * t); };
     switch (filter) {
-      case ScaleFilter::Bilinear:
-        return x < 1 ? 1 - x : 0;
+      case ScaleFilter::Bilinear: return x < 1 ? 1 - x : 0;
       case ScaleFilter::Bicubic:
         return x < 1 ? 1.5 * x * x * x - 2.5 * x * x + 1 : x < 2 ? -0.5 * x * x * x + 2.5 * x * x - 4 * x + 2 : 0;
-      default:
-        return x < 3 ? sinc(x) * sinc(x / 3) : 0;
+      default: return x < 3 ? sinc(x) * sinc(x / 3) : 0;
     }
   }
   std::vector<double> Weights(int32_t i, int32_t count, int32_t sourceCount) const {
@@ -108,8 +108,7 @@ struct Reference {
       const auto weights = Weights(y, size.height, height);
       for (int32_t i = 0; i < size.width * height; ++i) {
         auto& sum = scaled[static_cast<size_t>(y * size.width + i % size.width)];
-        for (size_t c = 0; c < 4; ++c)
-          sum[c] += weights[static_cast<size_t>(i / size.width)] * narrow[static_cast<size_t>(i)][c];
+        for (size_t c = 0; c < 4; ++c) sum[c] += weights[static_cast<size_t>(i / size.width)] * narrow[static_cast<size_t>(i)][c];
       }
     }
     for (auto& sum : scaled) {
@@ -139,11 +138,10 @@ TEST(Scale, FollowsTheFiltersDefinition) {
   for (const Row& row : rows) {
     for (const ScaleFilter filter : {ScaleFilter::Lanczos, ScaleFilter::Bicubic, ScaleFilter::Bilinear}) {
       SCOPED_TRACE(testing::Message() << row.name << ", filter " << static_cast<int32_t>(filter));
-      const PicturePointer picture = MakePicture(row.source.width, row.source.height,
-                                                 [](int32_t x, int32_t y) { return Scatter(x, y) & 0xffffff; });
+      const PicturePointer picture =
+          MakePicture(row.source.width, row.source.height, [](int32_t x, int32_t y) { return Scatter(x, y) & 0xffffff; });
       if (row.alpha) {
-        test::AddAlpha(*picture,
-                       [](int32_t x, int32_t y) { return static_cast<int32_t>(100 + Scatter(x + 99, y) % 156); });
+        test::AddAlpha(*picture, [](int32_t x, int32_t y) { return static_cast<int32_t>(100 + Scatter(x + 99, y) % 156); });
       }
       PackedImage image, alpha;
       ASSERT_EQ(ScaleFiltered(picture->image, picture->alpha, row.size, filter, image, alpha), Status::Ok);
@@ -174,16 +172,14 @@ TEST(Scale, OneColorStaysThatColorAtEverySize) {
         if (alpha) test::AddAlpha(*picture, [](int32_t x, int32_t y) { return (x + y) % 2 == 0 ? 255 : 128; });
         for (const Size to : kOddSizes) {
           for (const ScaleFilter filter : kFilters) {
-            SCOPED_TRACE(testing::Message()
-                         << from.width << " x " << from.height << " to " << to.width << " x " << to.height
-                         << ", filter " << static_cast<int32_t>(filter) << ", alpha " << alpha);
+            SCOPED_TRACE(testing::Message() << from.width << " x " << from.height << " to " << to.width << " x " << to.height
+                                            << ", filter " << static_cast<int32_t>(filter) << ", alpha " << alpha);
             PackedImage image, plane;
             ASSERT_EQ(ScaleFiltered(picture->image, picture->alpha, to, filter, image, plane), Status::Ok);
             for (int32_t y = 0; y < to.height; ++y) {
               for (int32_t x = 0; x < to.width; ++x) {
                 for (int c = 0; c < 3; ++c) {
-                  ASSERT_NEAR(image.PixelAt(x, y) >> (8 * c) & 255, static_cast<int32_t>(color >> (8 * c) & 255),
-                              alpha);
+                  ASSERT_NEAR(image.PixelAt(x, y) >> (8 * c) & 255, static_cast<int32_t>(color >> (8 * c) & 255), alpha);
                 }
               }
             }
@@ -195,16 +191,13 @@ TEST(Scale, OneColorStaysThatColorAtEverySize) {
 }
 
 TEST(Scale, MirrorsStayMirrors) {
-  for (const auto& [width, size] :
-       {std::pair{40, Size{13, 9}}, {41, Size{100, 70}}, {400, Size{31, 20}}, {7, Size{8, 3}}}) {
+  for (const auto& [width, size] : {std::pair{40, Size{13, 9}}, {41, Size{100, 70}}, {400, Size{31, 20}}, {7, Size{8, 3}}}) {
     for (const ScaleFilter filter : kFilters) {
       for (const Orientation mirror : {Orientation::MirrorAcross, Orientation::MirrorDown}) {
-        SCOPED_TRACE(testing::Message() << width << " to " << size.width << ", filter "
-                                        << static_cast<int32_t>(filter));
+        SCOPED_TRACE(testing::Message() << width << " to " << size.width << ", filter " << static_cast<int32_t>(filter));
         // An even picture has no middle pixel that Nearest must break a tie for.
-        const PicturePointer picture = MakePicture(width, 21, [&](int32_t x, int32_t y) {
-          return Scatter(std::min(x, width - 1 - x), std::min(y, 20 - y)) & 0xffffff;
-        });
+        const PicturePointer picture = MakePicture(
+            width, 21, [&](int32_t x, int32_t y) { return Scatter(std::min(x, width - 1 - x), std::min(y, 20 - y)) & 0xffffff; });
         ASSERT_EQ(ScalePicture(*picture, size, filter), Status::Ok);
         std::vector<uint32_t> before = Colors(*picture);
         ASSERT_EQ(OrientPicture(*picture, mirror), Status::Ok);
@@ -225,8 +218,7 @@ TEST(Scale, NothingMovesAside) {
   for (const int32_t width : {32, 100, 255, 700}) {
     for (const ScaleFilter filter : kFilters) {
       SCOPED_TRACE(testing::Message() << "to " << width << ", filter " << static_cast<int32_t>(filter));
-      const PicturePointer picture =
-          MakePicture(1020, 40, [](int32_t x, int32_t) { return static_cast<uint32_t>(x / 4); });
+      const PicturePointer picture = MakePicture(1020, 40, [](int32_t x, int32_t) { return static_cast<uint32_t>(x / 4); });
       PackedImage image, plane;
       ASSERT_EQ(ScaleFiltered(picture->image, picture->alpha, {width, 40}, filter, image, plane), Status::Ok);
       double difference = 0;
@@ -240,11 +232,9 @@ TEST(Scale, NothingMovesAside) {
 TEST(Scale, TransparentColorsLeaveNoFringe) {
   for (const Size size : {Size{30, 30}, {200, 150}, {4, 4}, {61, 3}}) {
     for (const ScaleFilter filter : kFilters) {
-      SCOPED_TRACE(testing::Message() << size.width << " x " << size.height << ", filter "
-                                      << static_cast<int32_t>(filter));
+      SCOPED_TRACE(testing::Message() << size.width << " x " << size.height << ", filter " << static_cast<int32_t>(filter));
       const auto inside = [](int32_t x, int32_t y) { return (x - 30) * (x - 30) + (y - 30) * (y - 30) < 400; };
-      const PicturePointer picture =
-          MakePicture(61, 61, [&](int32_t x, int32_t y) { return inside(x, y) ? 0xf0e0d0 : 0u; });
+      const PicturePointer picture = MakePicture(61, 61, [&](int32_t x, int32_t y) { return inside(x, y) ? 0xf0e0d0 : 0u; });
       test::AddAlpha(*picture, [&](int32_t x, int32_t y) { return inside(x, y) ? 255 : 0; });
       ASSERT_EQ(ScalePicture(*picture, size, filter), Status::Ok);
       int32_t seen = 0;
@@ -299,14 +289,13 @@ TEST(Scale, ThreadsAndPointsAndPalettes) {
                          {{30, 20}, {11, 40}}}) {
     for (const int32_t bits : {1, 4, 8}) {
       for (const ScaleFilter filter : kFilters) {
-        SCOPED_TRACE(testing::Message() << row.source.width << " x " << row.source.height << " to " << row.size.width
-                                        << " x " << row.size.height << ", " << bits << " bits, filter "
-                                        << static_cast<int32_t>(filter));
+        SCOPED_TRACE(testing::Message() << row.source.width << " x " << row.source.height << " to " << row.size.width << " x "
+                                        << row.size.height << ", " << bits << " bits, filter " << static_cast<int32_t>(filter));
         const PicturePointer picture = MakePicture(row.source.width, row.source.height, [bits](int32_t x, int32_t y) {
           return Scatter(x, y) % (1u << bits) * (0xffffffu / ((1u << bits) - 1));
         });
-        const PicturePointer deep = MakePicture(row.source.width, row.source.height,
-                                                [&](int32_t x, int32_t y) { return test::ColorAt(*picture, x, y); });
+        const PicturePointer deep =
+            MakePicture(row.source.width, row.source.height, [&](int32_t x, int32_t y) { return test::ColorAt(*picture, x, y); });
         bool packed = false;
         ASSERT_EQ(PackFewColors(*picture, 8, packed), Status::Ok);
         ASSERT_EQ(ScalePicture(*picture, row.size, filter), Status::Ok);
@@ -338,8 +327,7 @@ TEST(Scale, EveryProcessorsLoopsGiveTheSame) {
   const std::pair<const char*, Run> rows[] = {
       {"bytes", [&](auto& k, auto& out) { k.weighBytes(byteRows, windows[1], 8, 201, out.data()); }},
       {"shorts", [&](auto& k, auto& out) { k.weighShorts(shortRows, windows[1], 15, 256, out.data()); }},
-      {"three",
-       [&](auto& k, auto& out) { k.scaleThree(shorts.data(), windows.data(), 50, 14, out.data()), out[150] = 0; }},
+      {"three", [&](auto& k, auto& out) { k.scaleThree(shorts.data(), windows.data(), 50, 14, out.data()), out[150] = 0; }},
       {"four", [&](auto& k, auto& out) { k.scaleFour(shorts.data(), windows.data(), 50, 14, out.data()); }},
       {"widen", [&](auto& k, auto& out) { k.widen(bytes.data(), 301, out.data()); }},
       {"multiply", [&](auto& k, auto& out) { k.multiply(bytes.data(), bytes.data() + 999, 77, out.data()); }},

@@ -22,8 +22,7 @@ std::string Contents(std::FILE* file) {
 
 CommandResult RunCommand(const std::vector<std::string>& arguments, const Terminal& terminal) {
   const ScopedSettings keep;  // options may change some for the run
-  cli::Io io{std::tmpfile(),       std::tmpfile(),  std::tmpfile(),
-             terminal.interactive, terminal.output, terminal.interactive};
+  cli::Io io{std::tmpfile(), std::tmpfile(), std::tmpfile(), terminal.interactive, terminal.output, terminal.interactive};
   std::fwrite(terminal.input.data(), 1, terminal.input.size(), io.in);
   std::rewind(io.in);
   std::vector<const char*> words{"fotomill"};

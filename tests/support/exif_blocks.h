@@ -19,9 +19,7 @@ class CollectedLines : public ExifSink {
     numbers.push_back(number);
     lines.push_back("DIRECTORY " + std::string(label));
   }
-  void Line(const ExifLine& line) override {
-    lines.push_back(std::string(line.name) + "=" + std::string(line.text));
-  }
+  void Line(const ExifLine& line) override { lines.push_back(std::string(line.name) + "=" + std::string(line.text)); }
   std::vector<std::string> lines;
   std::vector<int32_t> numbers;
 };

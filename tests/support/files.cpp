@@ -30,7 +30,8 @@ std::vector<std::string> TemporaryFolder::Names() const {
 }
 
 void WriteBytes(const std::string& path, std::span<const uint8_t> bytes) {
-  std::ofstream(path, std::ios::binary).write(reinterpret_cast<const char*>(bytes.data()), static_cast<std::streamsize>(bytes.size()));
+  std::ofstream(path, std::ios::binary)
+      .write(reinterpret_cast<const char*>(bytes.data()), static_cast<std::streamsize>(bytes.size()));
 }
 
 void WriteText(const std::string& path, std::string_view text) {

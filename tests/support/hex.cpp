@@ -9,7 +9,10 @@ std::vector<uint8_t> Hex(std::string_view text) {
   for (const char c : text) {
     if (c == '#') remark = true;
     if (c == '\n') remark = false;
-    const int digit = c >= '0' && c <= '9' ? c - '0' : c >= 'a' && c <= 'f' ? c - 'a' + 10 : c >= 'A' && c <= 'F' ? c - 'A' + 10 : -1;
+    const int digit = c >= '0' && c <= '9'   ? c - '0'
+                      : c >= 'a' && c <= 'f' ? c - 'a' + 10
+                      : c >= 'A' && c <= 'F' ? c - 'A' + 10
+                                             : -1;
     if (remark || digit < 0) continue;
     if (high < 0) {
       high = digit;

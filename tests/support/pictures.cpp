@@ -4,8 +4,7 @@
 
 namespace fotomill::test {
 
-PicturePointer MakePicture(int32_t width, int32_t height, int32_t bitsPerPixel,
-                           const std::vector<std::vector<uint8_t>>& rows) {
+PicturePointer MakePicture(int32_t width, int32_t height, int32_t bitsPerPixel, const std::vector<std::vector<uint8_t>>& rows) {
   PicturePointer picture = NewPictureRecord();
   picture->width = width;
   picture->height = height;

@@ -18,14 +18,15 @@ class Background {
   void Start(wxEvtHandler& window, std::function<void(const std::atomic<bool>& stop)> work, std::function<void()> done) {
     Stop();
     job_ = std::make_shared<Job>();
-    job_->thread = std::thread([job = job_.get(), shared = std::weak_ptr<Job>(job_), &window, work = std::move(work), done = std::move(done)] {
-      work(job->stop);
-      if (job->stop) return;
-      window.CallAfter([shared, done] {
-        const std::shared_ptr<Job> still = shared.lock();
-        if (still != nullptr && !still->stop) done();
-      });
-    });
+    job_->thread = std::thread(
+        [job = job_.get(), shared = std::weak_ptr<Job>(job_), &window, work = std::move(work), done = std::move(done)] {
+          work(job->stop);
+          if (job->stop) return;
+          window.CallAfter([shared, done] {
+            const std::shared_ptr<Job> still = shared.lock();
+            if (still != nullptr && !still->stop) done();
+          });
+        });
   }
   void Stop() {
     if (job_ == nullptr) return;

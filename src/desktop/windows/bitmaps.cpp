@@ -24,7 +24,8 @@ constexpr SymbolShape kSymbols[] = {
     {"folder", "<path d='M1.5 4 V13 H14.5 V5.5 H8 L6.5 3.5 H2 Z'/>"},
     {"home", "<path d='M2 8 L8 2.5 L14 8 M3.5 7 V13.5 H12.5 V7 M6.5 13.5 V9.5 H9.5 V13.5'/>"},
     {"view", "<path d='M1 8 C3 4 6 3 8 3 C10 3 13 4 15 8 C13 12 10 13 8 13 C6 13 3 12 1 8 Z'/><circle cx='8' cy='8' r='2.2'/>"},
-    {"slideshow", "<path d='M1.5 2.5 H14.5 V11 H1.5 Z M8 11 V13.5 M5 13.5 H11'/><path d='M6.5 4.7 L10.3 6.8 L6.5 8.9 Z' fill='COLOR'/>"},
+    {"slideshow",
+     "<path d='M1.5 2.5 H14.5 V11 H1.5 Z M8 11 V13.5 M5 13.5 H11'/><path d='M6.5 4.7 L10.3 6.8 L6.5 8.9 Z' fill='COLOR'/>"},
     {"convert", "<path d='M2 5.5 H12 M9.5 3 L12 5.5 L9.5 8 M14 10.5 H4 M6.5 8 L4 10.5 L6.5 13'/>"},
     {"rename", "<path d='M2 11 L10.5 2.5 L13.5 5.5 L5 14 H2 Z M8.5 4.5 L11.5 7.5'/>"},
     {"copy", "<path d='M5.5 5.5 H13.5 V14 H5.5 Z M10.5 5.5 V2 H2.5 V10.5 H5.5'/>"},
@@ -33,12 +34,16 @@ constexpr SymbolShape kSymbols[] = {
     {"info", "<circle cx='8' cy='8' r='6.2'/><path d='M8 7.2 V11.5 M8 4.4 V5.4'/>"},
     {"exif", "<path d='M1.5 4.5 H4.5 L6 2.5 H10 L11.5 4.5 H14.5 V13 H1.5 Z'/><circle cx='8' cy='8.5' r='2.6'/>"},
     {"undo", "<path d='M5.5 3 L2.5 6 L5.5 9 M2.5 6 H10 A3.5 3.5 0 0 1 10 13 H6'/>"},
-    {"setup", "<path d='M2 4.5 H9 M12.5 4.5 H14 M2 11.5 H4 M7.5 11.5 H14'/><circle cx='10.7' cy='4.5' r='1.8'/><circle cx='5.7' cy='11.5' r='1.8'/>"},
+    {"setup",
+     "<path d='M2 4.5 H9 M12.5 4.5 H14 M2 11.5 H4 M7.5 11.5 H14'/><circle cx='10.7' cy='4.5' r='1.8'/><circle cx='5.7' cy='11.5' "
+     "r='1.8'/>"},
     {"history", "<circle cx='8' cy='8' r='6.2'/><path d='M8 4.2 V8 L10.8 9.6'/>"},
     {"previous", "<path d='M12 3 L5 8 L12 13 Z M3.5 3 V13'/>"},
     {"next", "<path d='M4 3 L11 8 L4 13 Z M12.5 3 V13'/>"},
     {"fit", "<path d='M2 6 V2.5 H5.5 M10.5 2.5 H14 V6 M14 10 V13.5 H10.5 M5.5 13.5 H2 V10'/>"},
-    {"actual", "<path d='M3 4.5 L4.5 3.5 V12.5 M11.5 4.5 L13 3.5 V12.5'/><circle cx='8.4' cy='6.2' r='0.6'/><circle cx='8.4' cy='10.2' r='0.6'/>"},
+    {"actual",
+     "<path d='M3 4.5 L4.5 3.5 V12.5 M11.5 4.5 L13 3.5 V12.5'/><circle cx='8.4' cy='6.2' r='0.6'/><circle cx='8.4' cy='10.2' "
+     "r='0.6'/>"},
     {"zoom-in", "<circle cx='7' cy='7' r='4.7'/><path d='M10.5 10.5 L14.5 14.5 M4.7 7 H9.3 M7 4.7 V9.3'/>"},
     {"zoom-out", "<circle cx='7' cy='7' r='4.7'/><path d='M10.5 10.5 L14.5 14.5 M4.7 7 H9.3'/>"},
     {"full", "<path d='M9.5 6.5 L13.5 2.5 M10 2.5 H13.5 V6 M6.5 9.5 L2.5 13.5 M2.5 10 V13.5 H6'/>"},
@@ -73,8 +78,9 @@ wxBitmap BitmapOf(const RgbImage& image, double scale) {
 wxBitmapBundle Symbol(std::string_view name, int side) {
   for (const SymbolShape& symbol : kSymbols) {
     if (symbol.name != name) continue;
-    std::string svg = std::string("<svg xmlns='http://www.w3.org/2000/svg' width='16' height='16' viewBox='0 0 16 16'><g fill='none' "
-                                  "stroke='COLOR' stroke-width='1.3' stroke-linecap='round' stroke-linejoin='round'>") +
+    std::string svg = std::string(
+                          "<svg xmlns='http://www.w3.org/2000/svg' width='16' height='16' viewBox='0 0 16 16'><g fill='none' "
+                          "stroke='COLOR' stroke-width='1.3' stroke-linecap='round' stroke-linejoin='round'>") +
                       symbol.shape + "</g></svg>";
     ReplaceAll(svg, "COLOR", HexColor(wxSystemSettings::GetColour(wxSYS_COLOUR_WINDOWTEXT)));
     return wxBitmapBundle::FromSVG(svg.c_str(), wxSize(side, side));

@@ -1,8 +1,8 @@
 #include "desktop/windows/browser_page.h"
 
 #include <wx/bmpbuttn.h>
-#include <wx/dnd.h>
 #include <wx/dataobj.h>
+#include <wx/dnd.h>
 #include <wx/filename.h>
 #include <wx/simplebook.h>
 #include <wx/sizer.h>
@@ -82,9 +82,10 @@ BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& 
   sizer->Add(updateBar_, wxSizerFlags().Expand());
   sizer->Add(views_, wxSizerFlags(1).Expand());
   SetSizer(sizer);
-  SetDropTarget(new FolderDrop(
-      [this](const wxPoint&) { return model_.Folder(); },
-      [this](const std::vector<std::string>& files, const std::string& folder, bool move) { host_.DropFiles(files, folder, move); }));
+  SetDropTarget(new FolderDrop([this](const wxPoint&) { return model_.Folder(); },
+                               [this](const std::vector<std::string>& files, const std::string& folder, bool move) {
+                                 host_.DropFiles(files, folder, move);
+                               }));
   Bind(wxEVT_TIMER, [this](wxTimerEvent&) { Reload(); });
   Bind(wxEVT_FSWATCHER, [this](wxFileSystemWatcherEvent& event) {
     constexpr int kNoChange = wxFSW_EVENT_ACCESS | wxFSW_EVENT_WARNING | wxFSW_EVENT_ERROR;
@@ -115,8 +116,8 @@ void BrowserPage::BuildPathBar() {
     FocusList();
   };
   path_->Bind(wxEVT_KEY_DOWN, leave);
-  filter_ = new wxSearchCtrl(this, wxID_ANY, "", wxDefaultPosition, FromDIP(wxSize(200, -1)), wxTE_PROCESS_ENTER, wxDefaultValidator,
-                             "Filter");
+  filter_ = new wxSearchCtrl(this, wxID_ANY, "", wxDefaultPosition, FromDIP(wxSize(200, -1)), wxTE_PROCESS_ENTER,
+                             wxDefaultValidator, "Filter");
   filter_->SetDescriptiveText("Filter");
   filter_->ShowCancelButton(true);
   filter_->SetToolTip("Shows only files whose names contain this, or match its * and ?");

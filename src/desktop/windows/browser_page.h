@@ -107,7 +107,7 @@ class BrowserPage : public wxPanel {
   struct Job {
     std::atomic<bool> stop{false};
   };
-  std::shared_ptr<Job> job_;  // of the latest listing
+  std::shared_ptr<Job> job_;       // of the latest listing
   std::shared_ptr<Job> factsJob_;  // reads headers for columns and orders that need them
   std::unique_ptr<wxFileSystemWatcher> watcher_;
   wxTimer reloadTimer_;

@@ -35,7 +35,8 @@ bool HoldsEveryWord(const wxString& text, const wxString& words) {
 class FinderBox : public wxDialog {
  public:
   explicit FinderBox(wxWindow* parent)
-      : wxDialog(parent, wxID_ANY, "Find command", wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "FindCommandBox") {
+      : wxDialog(parent, wxID_ANY, "Find command", wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
+                 "FindCommandBox") {
     words_ = new wxTextCtrl(this, wxID_ANY, wxEmptyString, wxDefaultPosition, FromDIP(wxSize(420, -1)), wxTE_PROCESS_ENTER);
     words_->SetHint("Words of its name");
     words_->SetName("Words of the command's name");

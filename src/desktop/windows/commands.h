@@ -11,9 +11,9 @@ class MainFrame;
 // When a command can be used; where it cannot, its menu item and button are grey.
 enum class Needs {
   Nothing,
-  Files,    // at least one file selected or focused
-  Item,     // at least one file or folder
-  Undo,     // something to take back; the menu item then names it
+  Files,  // at least one file selected or focused
+  Item,   // at least one file or folder
+  Undo,   // something to take back; the menu item then names it
   Redo,
   ClosedTab,
 };
@@ -21,14 +21,14 @@ enum class Needs {
 // One function of the frame: a menu item, perhaps a button, its keys, and what it does. A new window is one row in
 // commands.cpp. Menus and toolbar are in the order of the rows; a row without text draws a line in its menu.
 struct Command {
-  const char* menu;                  // "&File"
-  const char* text;                  // with mnemonic; null for a separator
-  const char* accelerator = "";      // as wxWidgets writes them, empty for none
-  const char* help = "";             // one sentence for the status bar
+  const char* menu;              // "&File"
+  const char* text;              // with mnemonic; null for a separator
+  const char* accelerator = "";  // as wxWidgets writes them, empty for none
+  const char* help = "";         // one sentence for the status bar
   Needs needs = Needs::Nothing;
   void (*run)(MainFrame& frame) = nullptr;
-  const char* symbol = nullptr;      // of the button in the toolbar (bitmaps.cpp), null for no button
-  bool inContextMenu = false;        // of a file in a browser
+  const char* symbol = nullptr;                       // of the button in the toolbar (bitmaps.cpp), null for no button
+  bool inContextMenu = false;                         // of a file in a browser
   bool (*checked)(const MainFrame& frame) = nullptr;  // whether its menu item has a mark; null for one that never has
 };
 

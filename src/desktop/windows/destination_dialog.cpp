@@ -26,7 +26,8 @@
 namespace fotomill::desktop {
 
 DestinationDialog::DestinationDialog(wxWindow* parent, const wxString& verb, const std::vector<std::string>& files)
-    : wxDialog(parent, wxID_ANY, verb, wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "DestinationBox"),
+    : wxDialog(parent, wxID_ANY, verb, wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
+               "DestinationBox"),
       files_(files) {
   const int gap = FromDIP(8);
   auto* sizer = new wxBoxSizer(wxVERTICAL);
@@ -46,9 +47,11 @@ DestinationDialog::DestinationDialog(wxWindow* parent, const wxString& verb, con
   into_ = new wxRadioButton(this, wxID_ANY, "&Into the folder");
   sizer->Add(beside_, below);
   auto* folderRow = new wxBoxSizer(wxHORIZONTAL);
-  folder_ = new wxComboBox(this, wxID_ANY, "", wxDefaultPosition, FromDIP(wxSize(420, -1)), 0, nullptr, 0, wxDefaultValidator, "Folder");
+  folder_ = new wxComboBox(this, wxID_ANY, "", wxDefaultPosition, FromDIP(wxSize(420, -1)), 0, nullptr, 0, wxDefaultValidator,
+                           "Folder");
   for (const std::string& folder : RecentDestinations()) folder_->Append(wxString::FromUTF8(folder));
-  folder_->SetValue(folder_->GetCount() > 0 ? folder_->GetString(0) : wxString::FromUTF8(std::string(platform::SplitPath(files_.front()).folder)));
+  folder_->SetValue(folder_->GetCount() > 0 ? folder_->GetString(0)
+                                            : wxString::FromUTF8(std::string(platform::SplitPath(files_.front()).folder)));
   folder_->AutoCompleteDirectories();
   browse_ = new wxButton(this, wxID_ANY, "B&rowse...");
   folderRow->Add(into_, wxSizerFlags().CenterVertical().Border(wxRIGHT, gap));
@@ -69,7 +72,8 @@ DestinationDialog::DestinationDialog(wxWindow* parent, const wxString& verb, con
   sizer->Add(preview_, below);
 
   auto* buttons = new wxBoxSizer(wxHORIZONTAL);
-  ok_ = new wxButton(this, wxID_OK, verb + (files_.size() == 1 ? wxString(" &1 file") : wxString::Format(" &%zu files", files_.size())));
+  ok_ = new wxButton(this, wxID_OK,
+                     verb + (files_.size() == 1 ? wxString(" &1 file") : wxString::Format(" &%zu files", files_.size())));
   buttons->AddStretchSpacer();
   buttons->Add(new wxButton(this, wxID_CANCEL), wxSizerFlags().Border(wxRIGHT, gap));
   buttons->Add(ok_);

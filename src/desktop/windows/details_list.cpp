@@ -59,9 +59,10 @@ DetailsList::DetailsList(wxWindow* parent, BrowserModel& model, Events events)
       lines_(new Lines(model)) {
   AssociateModel(lines_.get());
   for (const Column& column : kColumns) {
-    auto* added = new wxDataViewColumn(column.title, new wxDataViewTextRenderer("string", wxDATAVIEW_CELL_INERT, column.alignment),
-                                       static_cast<unsigned>(&column - kColumns), FromDIP(column.width), column.alignment,
-                                       wxDATAVIEW_COL_RESIZABLE | wxDATAVIEW_COL_REORDERABLE);
+    auto* added =
+        new wxDataViewColumn(column.title, new wxDataViewTextRenderer("string", wxDATAVIEW_CELL_INERT, column.alignment),
+                             static_cast<unsigned>(&column - kColumns), FromDIP(column.width), column.alignment,
+                             wxDATAVIEW_COL_RESIZABLE | wxDATAVIEW_COL_REORDERABLE);
     AppendColumn(added);
   }
   Bind(wxEVT_DATAVIEW_SELECTION_CHANGED, [this](wxDataViewEvent&) { ReadSelection(); });

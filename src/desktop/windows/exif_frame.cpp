@@ -56,14 +56,15 @@ ExifFrame::ExifFrame(wxWindow* parent, const std::string& path)
   column->Add(middle, wxSizerFlags(1).Expand().Border(wxALL, gap));
   column->Add(buttons, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, gap));
   panel->SetSizer(column);
-  wxAcceleratorEntry keys[] = {{wxACCEL_CTRL, 'C', wxID_COPY},  {wxACCEL_CTRL | wxACCEL_SHIFT, 'C', wxID_SELECTALL},
-                               {wxACCEL_CTRL, 'S', wxID_SAVEAS}, {wxACCEL_CTRL, 'P', wxID_PRINT},
+  wxAcceleratorEntry keys[] = {{wxACCEL_CTRL, 'C', wxID_COPY},           {wxACCEL_CTRL | wxACCEL_SHIFT, 'C', wxID_SELECTALL},
+                               {wxACCEL_CTRL, 'S', wxID_SAVEAS},         {wxACCEL_CTRL, 'P', wxID_PRINT},
                                {wxACCEL_NORMAL, WXK_ESCAPE, wxID_CLOSE}, {wxACCEL_CTRL, 'W', wxID_CLOSE}};
   SetAcceleratorTable(wxAcceleratorTable(static_cast<int>(std::size(keys)), keys));
   SetSize(FromDIP(wxSize(880, 620)));
   CentreOnParent();
   list_->SetFocus();
-  work_.Start(*this, [this](const std::atomic<bool>&) { report_ = ReadExifReport(path_); }, [this] { Finished(); });
+  work_.Start(
+      *this, [this](const std::atomic<bool>&) { report_ = ReadExifReport(path_); }, [this] { Finished(); });
 }
 
 void ExifFrame::Finished() {
@@ -81,8 +82,9 @@ void ExifFrame::Finished() {
     thumbnail_->SetName("Thumbnail in the EXIF block");
   }
   if (!report_.thumbnailBytes.empty()) {
-    const std::string size = report_.thumbnail.Empty() ? "Thumbnail that cannot be decoded"
-                                                       : std::to_string(report_.thumbnail.width) + " x " + std::to_string(report_.thumbnail.height);
+    const std::string size = report_.thumbnail.Empty()
+                                 ? "Thumbnail that cannot be decoded"
+                                 : std::to_string(report_.thumbnail.width) + " x " + std::to_string(report_.thumbnail.height);
     thumbnailFacts_->SetLabel(wxString::FromUTF8(size + "\n" + WithThousands(report_.thumbnailBytes.size()) + " bytes"));
   }
   for (const wxWindowID id : {wxID_COPY, wxID_SELECTALL, wxID_SAVEAS, wxID_PRINT}) FindWindow(id)->Enable(!report_.rows.empty());
@@ -100,7 +102,8 @@ wxString ExifFrame::SelectedValue() const {
 
 void ExifFrame::SaveThumbnail() {
   const std::string name = std::string(platform::SplitPath(path_).base) + "_thumbnail.jpg";
-  wxFileDialog dialog(this, "Save thumbnail", wxEmptyString, Shown(name), "JPEG files (*.jpg)|*.jpg", wxFD_SAVE | wxFD_OVERWRITE_PROMPT);
+  wxFileDialog dialog(this, "Save thumbnail", wxEmptyString, Shown(name), "JPEG files (*.jpg)|*.jpg",
+                      wxFD_SAVE | wxFD_OVERWRITE_PROMPT);
   if (dialog.ShowModal() != wxID_OK) return;
   const std::string target = Utf8(dialog.GetPath());
   const platform::FileFacts own = platform::FactsOf(path_), other = platform::FactsOf(target);

@@ -57,7 +57,8 @@ void FileActions::Run(const std::string& what, Work work, Then then) {
 void FileActions::Finished(const std::string& what, DeedResult result, const Then& then) {
   busy_ = false;
   frame_.Tell(what + (result.failures.empty() ? "" : ", " + std::to_string(result.failures.size()) + " failed"));
-  LogEvent("files", what + " done=" + std::to_string(result.done.steps.size()) + " failed=" + std::to_string(result.failures.size()));
+  LogEvent("files",
+           what + " done=" + std::to_string(result.done.steps.size()) + " failed=" + std::to_string(result.failures.size()));
   const std::vector<DeedFailure> failures = result.failures;
   then(std::move(result));
   frame_.FilesChanged();
@@ -79,7 +80,8 @@ void FileActions::Do(DeedKind kind, const std::vector<std::string>& paths, const
   FileDeed name{kind, std::vector<FileStep>(paths.size(), FileStep{paths.front(), {}})};
   std::string what = DeedName(name);
   what[0] = static_cast<char>(what[0] - 'a' + 'A');
-  Run(what, [kind, paths, folder](const DeedProgress& progress) { return CarryOut(PlanDeed(kind, paths, folder), progress); },
+  Run(
+      what, [kind, paths, folder](const DeedProgress& progress) { return CarryOut(PlanDeed(kind, paths, folder), progress); },
       [this](DeedResult result) { undo_.Add(std::move(result.done)); });
 }
 
@@ -97,7 +99,8 @@ void FileActions::Delete(const std::vector<std::string>& paths) {
   dialog.SetOKLabel("&Delete");
   LogEvent("prompt", "delete");
   if (dialog.ShowModal() != wxID_OK) return;
-  Run("Deletion for good", [paths](const DeedProgress& progress) { return DeleteForGood(paths, progress); }, [](DeedResult) {});
+  Run(
+      "Deletion for good", [paths](const DeedProgress& progress) { return DeleteForGood(paths, progress); }, [](DeedResult) {});
 }
 
 void FileActions::CopyTo(const std::vector<std::string>& paths, const std::string& folder) { Do(DeedKind::Copy, paths, folder); }
@@ -105,7 +108,8 @@ void FileActions::MoveTo(const std::vector<std::string>& paths, const std::strin
 
 void FileActions::Rename(const std::string& path, const std::string& name) {
   if (!IsPlainName(name)) {
-    wxMessageBox("A name cannot hold \"" + Shown(std::string(1, platform::kSeparator)) + "\".", "Rename", wxOK | wxICON_WARNING, &frame_);
+    wxMessageBox("A name cannot hold \"" + Shown(std::string(1, platform::kSeparator)) + "\".", "Rename", wxOK | wxICON_WARNING,
+                 &frame_);
     return;
   }
   RenameAll({{path, platform::JoinFolder(platform::SplitPath(path).folder, name)}});
@@ -116,14 +120,16 @@ void FileActions::RenameAll(std::vector<FileStep> steps) {
   FileDeed deed{DeedKind::Rename, std::move(steps)};
   const std::string shown(platform::FileNameOf(deed.steps.front().to));
   const bool one = deed.steps.size() == 1;
-  Run("Rename", [deed](const DeedProgress& progress) { return CarryOut(deed, progress); },
+  Run(
+      "Rename", [deed](const DeedProgress& progress) { return CarryOut(deed, progress); },
       [this, one, shown](DeedResult result) {
         const bool done = !result.done.steps.empty();
         for (const FileStep& step : result.done.steps) {
           frame_.NoteUses({FileUse{step.from, FileFunction::MoveAndCopy, kOwnTime, kOwnTime, true}});
         }
         undo_.Add(std::move(result.done));
-        if (BrowserPage* browser = frame_.Browser(); one && done && browser != nullptr) browser->Open(browser->Model().Folder(), shown);
+        if (BrowserPage* browser = frame_.Browser(); one && done && browser != nullptr)
+          browser->Open(browser->Model().Folder(), shown);
       });
 }
 
@@ -144,14 +150,16 @@ void FileActions::NewFolder(const std::string& parent) {
 void FileActions::Undo() {
   if (!undo_.CanUndo() || busy_) return;
   const FileDeed deed = undo_.TakeUndo();
-  Run("Undo " + DeedName(deed), [deed](const DeedProgress& progress) { return TakeBack(deed, progress); },
+  Run(
+      "Undo " + DeedName(deed), [deed](const DeedProgress& progress) { return TakeBack(deed, progress); },
       [this](DeedResult result) { undo_.Undone(std::move(result.done)); });
 }
 
 void FileActions::Redo() {
   if (!undo_.CanRedo() || busy_) return;
   const FileDeed deed = undo_.TakeRedo();
-  Run("Redo " + DeedName(deed), [deed](const DeedProgress& progress) { return CarryOut(deed, progress); },
+  Run(
+      "Redo " + DeedName(deed), [deed](const DeedProgress& progress) { return CarryOut(deed, progress); },
       [this](DeedResult result) { undo_.Redone(std::move(result.done)); });
 }
 
@@ -207,7 +215,8 @@ void DeleteSelection(MainFrame& frame) { frame.Files().Delete(frame.SelectedPath
 
 namespace {
 
-void AskAndDo(MainFrame& frame, const wxString& verb, void (FileActions::*action)(const std::vector<std::string>&, const std::string&)) {
+void AskAndDo(MainFrame& frame, const wxString& verb,
+              void (FileActions::*action)(const std::vector<std::string>&, const std::string&)) {
   const std::vector<std::string> paths = frame.SelectedPaths();
   if (paths.empty()) return;
   const auto folder = AskForFolder(frame, verb + " " + Shown(Count(paths.size())) + " to", verb, HistoryList::MoveCopy);

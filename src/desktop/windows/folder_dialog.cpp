@@ -14,7 +14,8 @@
 namespace fotomill::desktop {
 
 std::optional<std::string> AskForFolder(wxWindow& parent, const wxString& title, const wxString& verb, HistoryList history) {
-  wxDialog dialog(&parent, wxID_ANY, title, wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "FolderBox");
+  wxDialog dialog(&parent, wxID_ANY, title, wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
+                  "FolderBox");
   const int gap = dialog.FromDIP(10);
   auto* sizer = new wxBoxSizer(wxVERTICAL);
   auto* row = new wxBoxSizer(wxHORIZONTAL);

@@ -24,7 +24,8 @@ DropKind KindNow() {
 
 // nullopt-like: 1 move, 0 copy, -1 neither.
 int AskKind(const std::string& folder) {
-  wxMessageDialog dialog(nullptr, "Move or copy the files to " + Shown(folder) + "?", "Drop", wxYES_NO | wxCANCEL | wxICON_QUESTION);
+  wxMessageDialog dialog(nullptr, "Move or copy the files to " + Shown(folder) + "?", "Drop",
+                         wxYES_NO | wxCANCEL | wxICON_QUESTION);
   dialog.SetYesNoLabels("&Move", "&Copy");
   const int answer = dialog.ShowModal();
   return answer == wxID_YES ? 1 : answer == wxID_NO ? 0 : -1;

@@ -61,8 +61,8 @@ void FormatList::Turn(const wxDataViewItem& item) {
   const SaveResult saved = SwitchFormat(index, on);
   LogEvent("formats", Utf8(GetTextValue(line, kFormatColumn)) + (on ? " on" : " off"));
   if (saved == SaveResult::Done || saved == SaveResult::Unchanged) return;
-  wxMessageBox(Shown(std::string(SaveMessage(saved)) + " The switch is turned until the program ends."), "Formats", wxOK | wxICON_WARNING,
-               wxGetTopLevelParent(this));
+  wxMessageBox(Shown(std::string(SaveMessage(saved)) + " The switch is turned until the program ends."), "Formats",
+               wxOK | wxICON_WARNING, wxGetTopLevelParent(this));
 }
 
 }  // namespace fotomill::desktop

@@ -29,7 +29,8 @@ void ShowHelp(wxWindow& window, std::string_view topic) {
   column->Add(dialog.CreateSeparatedButtonSizer(wxCLOSE), wxSizerFlags().Expand().Border(wxALL, dialog.FromDIP(8)));
   dialog.SetSizerAndFit(column);
   dialog.SetEscapeId(wxID_CLOSE);
-  dialog.Bind(wxEVT_BUTTON, [&dialog](wxCommandEvent&) { dialog.EndModal(wxID_CLOSE); }, wxID_CLOSE);
+  dialog.Bind(
+      wxEVT_BUTTON, [&dialog](wxCommandEvent&) { dialog.EndModal(wxID_CLOSE); }, wxID_CLOSE);
   text->SetFocus();
   LogEvent("help", help.title);
   dialog.CentreOnParent();

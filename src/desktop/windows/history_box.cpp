@@ -56,8 +56,8 @@ class FileHistoryBox::Lines : public wxDataViewVirtualListModel {
 };
 
 FileHistoryBox::FileHistoryBox(MainFrame& frame)
-    : wxDialog(&frame, wxID_ANY, kTitle, wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER | wxMAXIMIZE_BOX,
-               "FileHistoryBox"),
+    : wxDialog(&frame, wxID_ANY, kTitle, wxDefaultPosition, wxDefaultSize,
+               wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER | wxMAXIMIZE_BOX, "FileHistoryBox"),
       frame_(frame),
       thumbnails_([this](const std::vector<std::string>& paths) {
         for (size_t row = 0; row < history_.Count(); ++row) {
@@ -116,10 +116,11 @@ void FileHistoryBox::AddColumns() {
     const wxAlignment alignment = facts.number ? wxALIGN_RIGHT : wxALIGN_LEFT;
     const int middle = alignment | wxALIGN_CENTER_VERTICAL;
     const int width = std::max(NumberIn(KeyOf(facts.width)) * whole / kWholeWidth, FromDIP(30));
-    wxDataViewRenderer* renderer = i == choice::kColumnName
-                                       ? static_cast<wxDataViewRenderer*>(new wxDataViewIconTextRenderer("wxDataViewIconText", wxDATAVIEW_CELL_INERT, middle))
-                                       : new wxDataViewTextRenderer("string", wxDATAVIEW_CELL_INERT, middle);
-    list_->AppendColumn(new wxDataViewColumn(facts.title, renderer, i, width, alignment, wxDATAVIEW_COL_RESIZABLE | wxDATAVIEW_COL_REORDERABLE));
+    wxDataViewRenderer* renderer = i == choice::kColumnName ? static_cast<wxDataViewRenderer*>(new wxDataViewIconTextRenderer(
+                                                                  "wxDataViewIconText", wxDATAVIEW_CELL_INERT, middle))
+                                                            : new wxDataViewTextRenderer("string", wxDATAVIEW_CELL_INERT, middle);
+    list_->AppendColumn(
+        new wxDataViewColumn(facts.title, renderer, i, width, alignment, wxDATAVIEW_COL_RESIZABLE | wxDATAVIEW_COL_REORDERABLE));
   }
 }
 
@@ -139,8 +140,9 @@ void FileHistoryBox::Refill() {
 
 void FileHistoryBox::UpdateControls() {
   const size_t selected = SelectedRows().size();
-  wxString text = settings.FileHistoryEnable == 0 ? wxString("The file history is switched off; Options switches it on.")
-                                                  : wxString::Format(history_.Count() == 1 ? "%zu file" : "%zu files", history_.Count());
+  wxString text = settings.FileHistoryEnable == 0
+                      ? wxString("The file history is switched off; Options switches it on.")
+                      : wxString::Format(history_.Count() == 1 ? "%zu file" : "%zu files", history_.Count());
   if (settings.FileHistoryEnable != 0 && selected > 1) text += wxString::Format(", %zu selected", selected);
   if (!readable_) text = "The history file is there but cannot be read as one. Clear deletes it.";
   count_->SetLabel(text);
@@ -175,7 +177,8 @@ wxSizer* FileHistoryBox::BuildButtons() {
   auto* row = new wxBoxSizer(wxHORIZONTAL);
   for (const Button& button : kButtons) {
     row->Add(new wxButton(this, button.id, button.label), wxSizerFlags().Border(wxRIGHT, FromDIP(6)));
-    Bind(wxEVT_BUTTON, [this, run = button.run](wxCommandEvent&) { (this->*run)(); }, button.id);
+    Bind(
+        wxEVT_BUTTON, [this, run = button.run](wxCommandEvent&) { (this->*run)(); }, button.id);
   }
   row->AddStretchSpacer();
   row->Add(new wxButton(this, wxID_CLOSE, "Close"));
@@ -229,7 +232,8 @@ void FileHistoryBox::RemoveSelected() {
   const wxString what = rows.size() == 1 ? "\"" + Shown(history_.Cell(rows.front(), choice::kColumnName)) + "\""
                                          : wxString::Format("%zu entries", rows.size());
   if (!Confirm("Take " + what + " out of the file history?", "Remove")) return;
-  if (!history_.Remove(rows)) wxMessageBox("The history file could not be written. The entries stay.", kTitle, wxOK | wxICON_WARNING, this);
+  if (!history_.Remove(rows))
+    wxMessageBox("The history file could not be written. The entries stay.", kTitle, wxOK | wxICON_WARNING, this);
   Refill();
 }
 

@@ -30,7 +30,8 @@ constexpr int kProgressMs = 200;
 }  // namespace
 
 InfoFrame::InfoFrame(MainFrame& frame, wxWindow* parent, std::vector<std::string> paths)
-    : wxFrame(parent, wxID_ANY, TitleOf(paths), wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE | wxFRAME_FLOAT_ON_PARENT, "InfoBox"),
+    : wxFrame(parent, wxID_ANY, TitleOf(paths), wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE | wxFRAME_FLOAT_ON_PARENT,
+              "InfoBox"),
       frame_(frame),
       paths_(std::move(paths)) {
   const int gap = FromDIP(10);
@@ -61,14 +62,17 @@ InfoFrame::InfoFrame(MainFrame& frame, wxWindow* parent, std::vector<std::string
     problem_->SetLabel(wxString::Format("Reading file %zu of %zu...", read_.load() + 1, paths_.size()));
   });
   timer_.Start(kProgressMs);
-  work_.Start(*this, [this](const std::atomic<bool>& stop) {
-    for (const std::string& path : paths_) {
-      if (stop) return;
-      files_.push_back(ReadFileInfo(path));
-      ++read_;
-    }
-    summary_ = SummaryOf(files_);
-  }, [this] { Finished(); });
+  work_.Start(
+      *this,
+      [this](const std::atomic<bool>& stop) {
+        for (const std::string& path : paths_) {
+          if (stop) return;
+          files_.push_back(ReadFileInfo(path));
+          ++read_;
+        }
+        summary_ = SummaryOf(files_);
+      },
+      [this] { Finished(); });
 }
 
 wxSizer* InfoFrame::BuildButtons(wxWindow& panel) {
@@ -78,8 +82,11 @@ wxSizer* InfoFrame::BuildButtons(wxWindow& panel) {
       {wxID_SAVE, "&Save as text...", [this] { SaveTextAs(*this, "info.txt", WholeText()); }},
       {wxID_CLOSE, "C&lose", [this] { Close(); }},
   };
-  wxAcceleratorEntry keys[] = {{wxACCEL_CTRL, 'C', wxID_COPY}, {wxACCEL_CTRL | wxACCEL_SHIFT, 'C', wxID_SELECTALL},
-                               {wxACCEL_CTRL, 'S', wxID_SAVE}, {wxACCEL_NORMAL, WXK_ESCAPE, wxID_CLOSE}, {wxACCEL_CTRL, 'W', wxID_CLOSE}};
+  wxAcceleratorEntry keys[] = {{wxACCEL_CTRL, 'C', wxID_COPY},
+                               {wxACCEL_CTRL | wxACCEL_SHIFT, 'C', wxID_SELECTALL},
+                               {wxACCEL_CTRL, 'S', wxID_SAVE},
+                               {wxACCEL_NORMAL, WXK_ESCAPE, wxID_CLOSE},
+                               {wxACCEL_CTRL, 'W', wxID_CLOSE}};
   SetAcceleratorTable(wxAcceleratorTable(static_cast<int>(std::size(keys)), keys));
   return BuildButtonRow(*this, panel, rows);
 }

@@ -32,14 +32,14 @@ class InfoFrame : public wxFrame {
 
   MainFrame& frame_;
   const std::vector<std::string> paths_;
-  std::vector<FileInfo> files_;        // written apart, then read here
+  std::vector<FileInfo> files_;  // written apart, then read here
   std::vector<InfoSection> summary_;
   std::atomic<size_t> read_{0};
   wxTimer timer_;
-  wxListBox* list_ = nullptr;          // none for one file
+  wxListBox* list_ = nullptr;  // none for one file
   wxStaticText* problem_ = nullptr;
   ReportTree* tree_ = nullptr;
-  Background work_;                    // last, so that it ends first
+  Background work_;  // last, so that it ends first
 };
 
 }  // namespace fotomill::desktop

@@ -55,7 +55,8 @@ MainFrame::MainFrame()
   batches_ = std::make_unique<BatchRunner>(*this);
   files_ = std::make_unique<FileActions>(*this);
   Bind(wxEVT_CLOSE_WINDOW, &MainFrame::OnClose, this);
-  Bind(wxEVT_TIMER, [this](wxTimerEvent&) { FlushUses(); }, usesTimer_.GetId());
+  Bind(
+      wxEVT_TIMER, [this](wxTimerEvent&) { FlushUses(); }, usesTimer_.GetId());
 }
 
 MainFrame::~MainFrame() {
@@ -80,21 +81,27 @@ void MainFrame::BuildMenus() {
   }
   SetMenuBar(bar);
   const int last = kFirstCommandId + static_cast<int>(Commands().size()) - 1;
-  Bind(wxEVT_MENU, [this](wxCommandEvent& event) {
-    const Command& command = Commands()[static_cast<size_t>(event.GetId() - kFirstCommandId)];
-    if (Enabled(command)) command.run(*this);
-  }, kFirstCommandId, last);
-  Bind(wxEVT_UPDATE_UI, [this](wxUpdateUIEvent& event) {
-    const Command& command = Commands()[static_cast<size_t>(event.GetId() - kFirstCommandId)];
-    event.Enable(Enabled(command));
-    if (command.checked != nullptr) event.Check(command.checked(*this));
-    if (command.needs != Needs::Undo && command.needs != Needs::Redo) return;
-    const std::string name = command.needs == Needs::Undo ? files_->Undoable().UndoName() : files_->Undoable().RedoName();
-    const wxString text = command.text + (name.empty() ? wxString() : " " + Shown(name)) + "\t" + command.accelerator;
-    if (event.GetEventObject() == GetMenuBar() || GetMenuBar()->FindItem(event.GetId())->GetItemLabel() != text) {
-      GetMenuBar()->FindItem(event.GetId())->SetItemLabel(text);
-    }
-  }, kFirstCommandId, last);
+  Bind(
+      wxEVT_MENU,
+      [this](wxCommandEvent& event) {
+        const Command& command = Commands()[static_cast<size_t>(event.GetId() - kFirstCommandId)];
+        if (Enabled(command)) command.run(*this);
+      },
+      kFirstCommandId, last);
+  Bind(
+      wxEVT_UPDATE_UI,
+      [this](wxUpdateUIEvent& event) {
+        const Command& command = Commands()[static_cast<size_t>(event.GetId() - kFirstCommandId)];
+        event.Enable(Enabled(command));
+        if (command.checked != nullptr) event.Check(command.checked(*this));
+        if (command.needs != Needs::Undo && command.needs != Needs::Redo) return;
+        const std::string name = command.needs == Needs::Undo ? files_->Undoable().UndoName() : files_->Undoable().RedoName();
+        const wxString text = command.text + (name.empty() ? wxString() : " " + Shown(name)) + "\t" + command.accelerator;
+        if (event.GetEventObject() == GetMenuBar() || GetMenuBar()->FindItem(event.GetId())->GetItemLabel() != text) {
+          GetMenuBar()->FindItem(event.GetId())->SetItemLabel(text);
+        }
+      },
+      kFirstCommandId, last);
 }
 
 void MainFrame::BuildToolbar() {
@@ -198,7 +205,8 @@ BrowserPage* MainFrame::OpenTab(const std::string& folder) {
 
 bool MainFrame::RestoreSession() {
   const Session session = LoadSession();
-  if (session.width > 0 && session.height > 0) SetSize(FromDIP(wxSize(std::max(session.width, 400), std::max(session.height, 300))));
+  if (session.width > 0 && session.height > 0)
+    SetSize(FromDIP(wxSize(std::max(session.width, 400), std::max(session.height, 300))));
   if (session.maximized) Maximize();
   if (settings.RememberOpenWindows == 0 || session.tabs.empty()) return false;
   for (const SessionTab& tab : session.tabs) {
@@ -333,7 +341,9 @@ void MainFrame::SelectFiles(const std::vector<std::string>& files) {
   BrowserModel& model = browser->Model();
   model.Selected().SelectNone();
   for (const std::string& file : files) {
-    const size_t line = platform::SplitPath(file).folder == platform::JoinFolder(model.Folder(), "") ? model.FindLine(platform::FileNameOf(file)) : kNoLine;
+    const size_t line = platform::SplitPath(file).folder == platform::JoinFolder(model.Folder(), "")
+                            ? model.FindLine(platform::FileNameOf(file))
+                            : kNoLine;
     if (line != kNoLine) model.Selected().Set(line, true);
   }
   browser->SelectionChanged();
@@ -361,11 +371,12 @@ void MainFrame::LogState() {
   if (!EventLogOn() || browser == nullptr) return;
   const BrowserModel& model = browser->Model();
   const size_t focus = model.Selected().Focus();
-  std::string state = "tabs=" + std::to_string(tabs_->GetPageCount()) + " lines=" + std::to_string(model.LineCount()) +
-                      " items=" + std::to_string(model.ItemCount()) + " selected=" + std::to_string(model.Selected().SelectedCount()) +
-                      " missing=" + std::to_string(browser->MissingThumbnails()) + " listing=" + std::to_string(browser->Listing()) +
-                      " view=" + std::to_string(model.Modes().view) + " sort=" + std::to_string(model.Modes().sort) +
-                      " focus=" + (focus == kNoLine ? std::string("-") : model.Line(focus).name) + " folder=" + model.Folder();
+  std::string state =
+      "tabs=" + std::to_string(tabs_->GetPageCount()) + " lines=" + std::to_string(model.LineCount()) +
+      " items=" + std::to_string(model.ItemCount()) + " selected=" + std::to_string(model.Selected().SelectedCount()) +
+      " missing=" + std::to_string(browser->MissingThumbnails()) + " listing=" + std::to_string(browser->Listing()) +
+      " view=" + std::to_string(model.Modes().view) + " sort=" + std::to_string(model.Modes().sort) +
+      " focus=" + (focus == kNoLine ? std::string("-") : model.Line(focus).name) + " folder=" + model.Folder();
   if (state == loggedState_) return;
   loggedState_ = state;
   LogEvent("browser", state);

@@ -28,10 +28,12 @@ OverwriteDialog::OverwriteDialog(wxWindow* parent, const OverwriteQuestion& ques
   auto* sizer = new wxBoxSizer(wxVERTICAL);
   const auto below = wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxTOP, gap);
   sizer->Add(new wxStaticText(this, wxID_ANY, wxString::FromUTF8(kOverwriteText.data(), kOverwriteText.size())), below);
-  sizer->Add(new wxStaticText(this, wxID_ANY, Shown(question.path), wxDefaultPosition, wxDefaultSize, wxST_ELLIPSIZE_MIDDLE), below);
+  sizer->Add(new wxStaticText(this, wxID_ANY, Shown(question.path), wxDefaultPosition, wxDefaultSize, wxST_ELLIPSIZE_MIDDLE),
+             below);
   auto* row = new wxBoxSizer(wxHORIZONTAL);
   row->Add(new wxStaticText(this, wxID_ANY, "&File name:"), wxSizerFlags().CenterVertical().Border(wxRIGHT, gap));
-  name_ = new wxTextCtrl(this, wxID_ANY, Shown(question.name), wxDefaultPosition, wxDefaultSize, 0, wxDefaultValidator, "File name");
+  name_ =
+      new wxTextCtrl(this, wxID_ANY, Shown(question.name), wxDefaultPosition, wxDefaultSize, 0, wxDefaultValidator, "File name");
   row->Add(name_, wxSizerFlags(1));
   row->Add(new wxStaticText(this, wxID_ANY, Shown(platform::SplitPath(question.path).extension)),
            wxSizerFlags().CenterVertical().Border(wxLEFT, gap / 2));
@@ -117,7 +119,8 @@ OverwriteAnswer OverwriteDialog::Answer() const {
   answer.ok = GetReturnCode() == wxID_OK;
   answer.skipRest = skipRest_;
   answer.name = Utf8(name_->GetValue());
-  answer.checks = {notify_->GetValue(), keepBoth_->GetValue(), applyToRest_->GetValue(), recycle_->GetValue(), previews_->GetValue()};
+  answer.checks = {notify_->GetValue(), keepBoth_->GetValue(), applyToRest_->GetValue(), recycle_->GetValue(),
+                   previews_->GetValue()};
   return answer;
 }
 

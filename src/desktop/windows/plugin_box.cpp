@@ -24,7 +24,8 @@ constexpr const char* kTitle = "Plug-ins";
 }  // namespace
 
 PluginBox::PluginBox(wxWindow* parent)
-    : wxDialog(parent, wxID_ANY, kTitle, wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "PluginBox") {
+    : wxDialog(parent, wxID_ANY, kTitle, wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
+               "PluginBox") {
   const int gap = FromDIP(10);
   list_ = new wxDataViewListCtrl(this, wxID_ANY, wxDefaultPosition, FromDIP(wxSize(820, 220)), wxDV_SINGLE | wxDV_ROW_LINES);
   list_->SetName(kTitle);
@@ -37,7 +38,8 @@ PluginBox::PluginBox(wxWindow* parent)
     list_->AppendTextColumn(column.title, wxDATAVIEW_CELL_INERT, FromDIP(column.width));
   }
   const std::string folder = platform::JoinFolder(platform::ProgramFolder(), "plugin");
-  auto* place = new wxStaticText(this, wxID_ANY, Shown("Plug-ins lie in the folder " + folder), wxDefaultPosition, wxDefaultSize, wxST_ELLIPSIZE_MIDDLE);
+  auto* place = new wxStaticText(this, wxID_ANY, Shown("Plug-ins lie in the folder " + folder), wxDefaultPosition, wxDefaultSize,
+                                 wxST_ELLIPSIZE_MIDDLE);
   note_ = new wxStaticText(this, wxID_ANY, "A switch that is turned counts from the next start of the program on.");
   auto* buttons = new wxBoxSizer(wxHORIZONTAL);
   buttons->Add(new wxButton(this, wxID_PREFERENCES, "&Configure..."));
@@ -49,7 +51,8 @@ PluginBox::PluginBox(wxWindow* parent)
   column->Add(note_, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxTOP, gap));
   column->Add(buttons, wxSizerFlags().Expand().Border(wxALL, gap));
   SetSizerAndFit(column);
-  Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { Configure(); }, wxID_PREFERENCES);
+  Bind(
+      wxEVT_BUTTON, [this](wxCommandEvent&) { Configure(); }, wxID_PREFERENCES);
   list_->Bind(wxEVT_DATAVIEW_ITEM_VALUE_CHANGED, [this](wxDataViewEvent& event) { Turn(list_->ItemToRow(event.GetItem())); });
   list_->Bind(wxEVT_CHAR_HOOK, [this](wxKeyEvent& event) {
     const int line = list_->GetSelectedRow();
@@ -77,10 +80,12 @@ void PluginBox::FillList() {
 
 // One line for each format of a module; one for a module that is not loaded.
 void PluginBox::AddModule(const PluginModule& module) {
-  const auto add = [&](int32_t row, std::string_view extension, std::string_view plugin, std::string_view formats, std::string_view can) {
+  const auto add = [&](int32_t row, std::string_view extension, std::string_view plugin, std::string_view formats,
+                       std::string_view can) {
     wxVector<wxVariant> cells;
     cells.push_back(module.on);
-    for (const std::string_view cell : {extension, plugin, formats, can, std::string_view(module.name)}) cells.push_back(Shown(cell));
+    for (const std::string_view cell : {extension, plugin, formats, can, std::string_view(module.name)})
+      cells.push_back(Shown(cell));
     list_->AppendItem(cells);
     lines_.push_back({module.name, row});
   };

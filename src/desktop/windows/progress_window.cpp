@@ -50,7 +50,8 @@ class ProgressWindow::DrawnList : public wxVListBox {
     int left = rect.x + FromDIP(6);
     if (box_.settings_.thumbnails && (side > 0 || box_.settings_.showMissingThumbnails)) {
       const ThumbnailPointer thumbnail = side > 0 ? box_.thumbnails_.FindAny(row.source) : nullptr;
-      if (thumbnail != nullptr && thumbnail->status == Status::Ok) DrawThumbnail(dc, *thumbnail, wxRect(left, rect.y, side, rect.height));
+      if (thumbnail != nullptr && thumbnail->status == Status::Ok)
+        DrawThumbnail(dc, *thumbnail, wxRect(left, rect.y, side, rect.height));
       if (HasPicture(row) || box_.settings_.showMissingThumbnails) left += FromDIP(kThumbnailSide) + FromDIP(8);
     }
     const bool failed = row.line.item.status != Status::Ok && !row.line.item.skipped;
@@ -119,8 +120,8 @@ ProgressWindow::ProgressWindow(wxWindow* frame, ThumbnailService& thumbnails, Ev
       newsTimer_(this) {
   panel_ = new wxPanel(this);
   list_ = MakeList(false);
-  status_ = new wxStaticText(panel_, kProgressStatusId, "", wxDefaultPosition, wxDefaultSize,
-                             wxST_NO_AUTORESIZE | wxST_ELLIPSIZE_END);
+  status_ =
+      new wxStaticText(panel_, kProgressStatusId, "", wxDefaultPosition, wxDefaultSize, wxST_NO_AUTORESIZE | wxST_ELLIPSIZE_END);
   bar_ = new wxGauge(panel_, wxID_ANY, 1, wxDefaultPosition, wxDefaultSize, wxGA_HORIZONTAL | wxGA_SMOOTH, wxDefaultValidator,
                      "Progress of the batch");
   abort_ = new wxButton(panel_, kProgressAbortId, "&Abort");

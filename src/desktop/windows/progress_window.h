@@ -67,7 +67,7 @@ class ProgressWindow : public wxFrame {
   wxGauge* bar_ = nullptr;
   wxButton* abort_ = nullptr;
   wxButton* close_ = nullptr;
-  wxButton* copy_ = nullptr;    // what the errors leave to do; hidden until there are some
+  wxButton* copy_ = nullptr;  // what the errors leave to do; hidden until there are some
   wxButton* select_ = nullptr;
 };
 

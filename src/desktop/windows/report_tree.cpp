@@ -4,8 +4,7 @@
 
 namespace fotomill::desktop {
 
-ReportTree::ReportTree(wxWindow* parent)
-    : wxTreeListCtrl(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTL_SINGLE) {
+ReportTree::ReportTree(wxWindow* parent) : wxTreeListCtrl(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTL_SINGLE) {
   SetName("Facts");
   AppendColumn("Name", FromDIP(260), wxALIGN_LEFT, wxCOL_RESIZABLE);
   AppendColumn("Value", FromDIP(360), wxALIGN_LEFT, wxCOL_RESIZABLE);

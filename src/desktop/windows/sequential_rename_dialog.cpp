@@ -94,7 +94,9 @@ SequentialRenameDialog::SequentialRenameDialog(wxWindow* parent, const std::vect
   const int gap = FromDIP(8);
   auto* grid = new wxFlexGridSizer(2, gap, gap);
   grid->AddGrowableCol(1);
-  const auto label = [&](const char* text) { grid->Add(new wxStaticText(this, wxID_ANY, text), wxSizerFlags().CenterVertical()); };
+  const auto label = [&](const char* text) {
+    grid->Add(new wxStaticText(this, wxID_ANY, text), wxSizerFlags().CenterVertical());
+  };
   label("&Base name:");
   base_ = new wxComboBox(this, wxID_ANY, wxString::FromUTF8(settings.SequentialRenameBaseName.c_str()), wxDefaultPosition,
                          FromDIP(wxSize(300, -1)), 0, nullptr, 0, wxDefaultValidator, "Base name");
@@ -103,7 +105,8 @@ SequentialRenameDialog::SequentialRenameDialog(wxWindow* parent, const std::vect
   }
   grid->Add(base_, wxSizerFlags(1).Expand());
   const auto spin = [&](const char* name, int least, int most, int value) {
-    auto* control = new wxSpinCtrl(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxSP_ARROW_KEYS, least, most, value, name);
+    auto* control =
+        new wxSpinCtrl(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxSP_ARROW_KEYS, least, most, value, name);
     grid->Add(control);
     control->Bind(wxEVT_SPINCTRL, [this](wxSpinEvent&) { UpdateControls(); });
     return control;
@@ -123,8 +126,8 @@ SequentialRenameDialog::SequentialRenameDialog(wxWindow* parent, const std::vect
     flags->Add(flags_[i], wxSizerFlags().Border(wxRIGHT | wxBOTTOM, gap));
   }
   sizer->Add(flags, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT, gap));
-  preview_ = new wxListCtrl(this, wxID_ANY, wxDefaultPosition, FromDIP(wxSize(520, 220)), wxLC_REPORT | wxLC_SINGLE_SEL, wxDefaultValidator,
-                            "New names");
+  preview_ = new wxListCtrl(this, wxID_ANY, wxDefaultPosition, FromDIP(wxSize(520, 220)), wxLC_REPORT | wxLC_SINGLE_SEL,
+                            wxDefaultValidator, "New names");
   preview_->AppendColumn("Old name", wxLIST_FORMAT_LEFT, FromDIP(250));
   preview_->AppendColumn("New name", wxLIST_FORMAT_LEFT, FromDIP(250));
   sizer->Add(preview_, wxSizerFlags(1).Expand().Border(wxLEFT | wxRIGHT, gap));
@@ -133,7 +136,8 @@ SequentialRenameDialog::SequentialRenameDialog(wxWindow* parent, const std::vect
   auto* buttons = new wxBoxSizer(wxHORIZONTAL);
   auto* help = new wxButton(this, wxID_HELP);
   help->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { ShowHelp(*this, "RENAME"); });
-  ok_ = new wxButton(this, wxID_OK, files_.size() == 1 ? wxString("Rename &1 file") : wxString::Format("Rename &%zu files", files_.size()));
+  ok_ = new wxButton(this, wxID_OK,
+                     files_.size() == 1 ? wxString("Rename &1 file") : wxString::Format("Rename &%zu files", files_.size()));
   buttons->Add(help);
   buttons->AddStretchSpacer();
   buttons->Add(new wxButton(this, wxID_CANCEL), wxSizerFlags().Border(wxRIGHT, gap));

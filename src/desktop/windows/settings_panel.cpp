@@ -45,7 +45,8 @@ wxWindow* MakeSpin(wxWindow* box, const KeyRow& row, wxWindowID id) {
   auto* range = new wxStaticText(box, id + static_cast<int>(kSpinRangeControl), Shown(SpinRangeText(SpinRangeOf(row))));
   range->Hide();
   const SpinRange limits = SpinRangeOf(row);
-  auto* spin = new wxSpinCtrl(box, id, wxEmptyString, wxDefaultPosition, wxDefaultSize, wxSP_ARROW_KEYS, limits.minimum, limits.maximum);
+  auto* spin =
+      new wxSpinCtrl(box, id, wxEmptyString, wxDefaultPosition, wxDefaultSize, wxSP_ARROW_KEYS, limits.minimum, limits.maximum);
   return spin;
 }
 
@@ -67,7 +68,8 @@ bool IsWide(const KeyRow& row) { return (row.type & (KEY_TEXT | KEY_CHOICE)) == 
 
 SettingsPanel::SettingsPanel(wxWindow* parent, std::vector<SetupItem> items, std::function<void()> changed,
                              const std::function<wxWindow*(wxWindow*)>& above)
-    : wxScrolledWindow(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxVSCROLL | wxTAB_TRAVERSAL), items_(std::move(items)) {
+    : wxScrolledWindow(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxVSCROLL | wxTAB_TRAVERSAL),
+      items_(std::move(items)) {
   const int gap = FromDIP(8);
   auto* column = new wxBoxSizer(wxVERTICAL);
   if (above) column->Add(above(this), wxSizerFlags(1).Expand().Border(wxALL, gap));
@@ -87,7 +89,8 @@ SettingsPanel::SettingsPanel(wxWindow* parent, std::vector<SetupItem> items, std
   }
   SetSizer(column);
   SetScrollRate(0, FromDIP(12));
-  for (const wxEventTypeTag<wxCommandEvent>& type : {wxEVT_CHECKBOX, wxEVT_CHOICE, wxEVT_TEXT, wxEVT_BUTTON, wxEVT_CHECKLISTBOX}) {
+  for (const wxEventTypeTag<wxCommandEvent>& type :
+       {wxEVT_CHECKBOX, wxEVT_CHOICE, wxEVT_TEXT, wxEVT_BUTTON, wxEVT_CHECKLISTBOX}) {
     Bind(type, [changed](wxCommandEvent& event) {
       NoteControlChanged(static_cast<uint32_t>(event.GetId()));
       changed();
@@ -148,7 +151,8 @@ void BindSettingsHelp(wxWindow& window) {
   window.Bind(wxEVT_CHAR_HOOK, [&window](wxKeyEvent& event) {
     if (event.GetKeyCode() != WXK_F1) return event.Skip();
     std::string_view page = kGeneralHelpPage;
-    for (const wxWindow* focus = wxWindow::FindFocus(); focus != nullptr && page == kGeneralHelpPage; focus = focus->GetParent()) {
+    for (const wxWindow* focus = wxWindow::FindFocus(); focus != nullptr && page == kGeneralHelpPage;
+         focus = focus->GetParent()) {
       if (focus->GetId() > 0) page = HelpPageFor(static_cast<uint32_t>(focus->GetId()));
     }
     ShowHelp(window, page);

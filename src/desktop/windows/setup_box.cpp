@@ -35,8 +35,8 @@ constexpr const char* kTransferFiles = "Settings (*.ini)|*.ini|All files|*";
 bool MayChangeSettings(wxWindow& window) {
   auto* const frame = dynamic_cast<MainFrame*>(wxTheApp->GetTopWindow());
   if (frame == nullptr || !frame->Batches().Running()) return true;
-  wxMessageBox("A batch is running with the settings as they are. Change them when it has ended.", kSetupTitle, wxOK | wxICON_INFORMATION,
-               &window);
+  wxMessageBox("A batch is running with the settings as they are. Change them when it has ended.", kSetupTitle,
+               wxOK | wxICON_INFORMATION, &window);
   return false;
 }
 
@@ -53,7 +53,8 @@ bool TakeSettings(wxWindow& window, const BoundControls& controls, const std::fu
   const SaveResult saved = SaveConfiguration();
   changed = saved != SaveResult::Unchanged;
   if (const std::string_view message = SaveMessage(saved); !message.empty()) {
-    wxMessageBox(Shown(std::string(message) + " The settings count until the program ends."), kSetupTitle, wxOK | wxICON_WARNING, &window);
+    wxMessageBox(Shown(std::string(message) + " The settings count until the program ends."), kSetupTitle, wxOK | wxICON_WARNING,
+                 &window);
   }
   return true;
 }
@@ -61,7 +62,8 @@ bool TakeSettings(wxWindow& window, const BoundControls& controls, const std::fu
 }  // namespace
 
 SetupBox::SetupBox(wxWindow* parent, std::function<void()> applied, SetupPage first)
-    : wxDialog(parent, wxID_ANY, kSetupTitle, wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "SetupBox"),
+    : wxDialog(parent, wxID_ANY, kSetupTitle, wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
+               "SetupBox"),
       applied_(std::move(applied)),
       controls_(*this),
       page_(first) {
@@ -122,8 +124,10 @@ void SetupBox::BuildPages() {
   book_ = new wxSimplebook(this);
   for (size_t page = 0; page < kSetupPageCount; ++page) {
     std::function<wxWindow*(wxWindow*)> above;
-    if (static_cast<SetupPage>(page) == SetupPage::Formats) above = [](wxWindow* parent) -> wxWindow* { return new FormatList(parent); };
-    auto* panel = new SettingsPanel(book_, ItemsOf(static_cast<SetupPage>(page)), [this] { ControlChanged(); }, above);
+    if (static_cast<SetupPage>(page) == SetupPage::Formats)
+      above = [](wxWindow* parent) -> wxWindow* { return new FormatList(parent); };
+    auto* panel = new SettingsPanel(
+        book_, ItemsOf(static_cast<SetupPage>(page)), [this] { ControlChanged(); }, above);
     book_->AddPage(panel, TitleOf(static_cast<SetupPage>(page)));
     panels_.push_back(panel);
   }
@@ -189,7 +193,8 @@ wxSizer* SetupBox::BuildButtons() {
       {"&Reset page", "Gives every setting of this page its default. Nothing is saved before OK or Apply.", &SetupBox::ResetPage},
       {"&Import...", "Takes settings from a file.", &SetupBox::Import},
       {"&Export...", "Writes the saved settings to a file.", &SetupBox::Export},
-      {"Open &data folder", "Shows the folder of the settings, the file history and the global thumbnail database.", &SetupBox::OpenDataFolder},
+      {"Open &data folder", "Shows the folder of the settings, the file history and the global thumbnail database.",
+       &SetupBox::OpenDataFolder},
   };
   auto* row = new wxBoxSizer(wxHORIZONTAL);
   for (const Button& button : kButtons) {
@@ -200,11 +205,16 @@ wxSizer* SetupBox::BuildButtons() {
   }
   row->AddStretchSpacer();
   row->Add(CreateButtonSizer(wxOK | wxCANCEL | wxAPPLY | wxHELP), wxSizerFlags());
-  Bind(wxEVT_BUTTON, [this](wxCommandEvent&) {
-    if (Apply()) EndModal(wxID_OK);
-  }, wxID_OK);
-  Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { (void)Apply(); }, wxID_APPLY);
-  Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { ShowHelp(*this, kGeneralHelpPage); }, wxID_HELP);
+  Bind(
+      wxEVT_BUTTON,
+      [this](wxCommandEvent&) {
+        if (Apply()) EndModal(wxID_OK);
+      },
+      wxID_OK);
+  Bind(
+      wxEVT_BUTTON, [this](wxCommandEvent&) { (void)Apply(); }, wxID_APPLY);
+  Bind(
+      wxEVT_BUTTON, [this](wxCommandEvent&) { ShowHelp(*this, kGeneralHelpPage); }, wxID_HELP);
   return row;
 }
 
@@ -241,7 +251,8 @@ void SetupBox::Import() {
 }
 
 void SetupBox::Export() {
-  wxFileDialog dialog(this, "Export settings", wxEmptyString, "Fotomill settings.ini", kTransferFiles, wxFD_SAVE | wxFD_OVERWRITE_PROMPT);
+  wxFileDialog dialog(this, "Export settings", wxEmptyString, "Fotomill settings.ini", kTransferFiles,
+                      wxFD_SAVE | wxFD_OVERWRITE_PROMPT);
   if (dialog.ShowModal() != wxID_OK) return;
   const Transfer transfer = ExportConfiguration(Utf8(dialog.GetPath()));
   Report(transfer.ok, transfer.message);
@@ -286,10 +297,15 @@ bool ShowSettingsBox(wxWindow* parent, const wxString& title, const wxString& na
   column->Add(panel, wxSizerFlags(1).Expand());
   column->Add(buttons, wxSizerFlags().Expand().Border(wxALL, dialog.FromDIP(10)));
   dialog.SetSizerAndFit(column);
-  dialog.Bind(wxEVT_BUTTON, [&](wxCommandEvent&) {
-    bool changed = false;
-    if (TakeSettings(dialog, controls, [](uint32_t) {}, changed)) dialog.EndModal(wxID_OK);
-  }, wxID_OK);
+  dialog.Bind(
+      wxEVT_BUTTON,
+      [&](wxCommandEvent&) {
+        bool changed = false;
+        if (TakeSettings(
+                dialog, controls, [](uint32_t) {}, changed))
+          dialog.EndModal(wxID_OK);
+      },
+      wxID_OK);
   BindSettingsHelp(dialog);
   dialog.CentreOnParent();
   LogEvent("settings", std::string("box=") + Utf8(name));

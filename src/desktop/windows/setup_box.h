@@ -23,8 +23,8 @@ class SetupBox : public wxDialog {
  private:
   void BuildPages();
   wxSizer* BuildButtons();
-  void ShowPages();               // fills the list at the left: all pages, or what the search found
-  void ChooseLine(bool focus);    // shows what the list has selected
+  void ShowPages();             // fills the list at the left: all pages, or what the search found
+  void ChooseLine(bool focus);  // shows what the list has selected
   void ShowPage(SetupPage page);
   void ControlChanged();
   bool Apply();

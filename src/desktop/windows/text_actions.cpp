@@ -75,7 +75,8 @@ void CopyText(const wxString& text) {
 }
 
 void SaveTextAs(wxWindow& parent, const wxString& name, const std::string& text) {
-  wxFileDialog dialog(&parent, "Save as text", wxEmptyString, name, "Text files (*.txt)|*.txt|All files|*", wxFD_SAVE | wxFD_OVERWRITE_PROMPT);
+  wxFileDialog dialog(&parent, "Save as text", wxEmptyString, name, "Text files (*.txt)|*.txt|All files|*",
+                      wxFD_SAVE | wxFD_OVERWRITE_PROMPT);
   if (dialog.ShowModal() != wxID_OK) return;
   if (platform::WriteWholeFile(Utf8(dialog.GetPath()), text)) return;
   wxMessageBox("The file \"" + dialog.GetPath() + "\" could not be written. Choose another folder or name.", "Save as text",

@@ -27,8 +27,8 @@ constexpr int kPadding = 6;            // inside a cell, device-independent pixe
 constexpr int kListWidth = 240;        // of a line in the list of names
 constexpr double kBitmapBytes = 96e6;  // kept for drawing, beside the thumbnails themselves
 constexpr size_t kMostCutNames = 5000;
-constexpr double kTypingPause = 1.0;   // seconds after which typing begins anew
-constexpr size_t kPrecache = 256;      // thumbnails wanted beyond what is near
+constexpr double kTypingPause = 1.0;  // seconds after which typing begins anew
+constexpr size_t kPrecache = 256;     // thumbnails wanted beyond what is near
 
 wxColour Blend(const wxColour& a, const wxColour& b, double part) {
   const auto mix = [part](int x, int y) { return static_cast<unsigned char>(std::lround(x + (y - x) * part)); };
@@ -55,9 +55,9 @@ ThumbnailCanvas::ThumbnailCanvas(wxWindow* parent, BrowserModel& model, Thumbnai
   SetLabel("Files of the folder");
   Bind(wxEVT_PAINT, &ThumbnailCanvas::OnPaint, this);
   Bind(wxEVT_SIZE, &ThumbnailCanvas::OnSize, this);
-  for (const auto& type : {wxEVT_SCROLLWIN_TOP, wxEVT_SCROLLWIN_BOTTOM, wxEVT_SCROLLWIN_LINEUP, wxEVT_SCROLLWIN_LINEDOWN,
-                           wxEVT_SCROLLWIN_PAGEUP, wxEVT_SCROLLWIN_PAGEDOWN, wxEVT_SCROLLWIN_THUMBTRACK,
-                           wxEVT_SCROLLWIN_THUMBRELEASE}) {
+  for (const auto& type :
+       {wxEVT_SCROLLWIN_TOP, wxEVT_SCROLLWIN_BOTTOM, wxEVT_SCROLLWIN_LINEUP, wxEVT_SCROLLWIN_LINEDOWN, wxEVT_SCROLLWIN_PAGEUP,
+        wxEVT_SCROLLWIN_PAGEDOWN, wxEVT_SCROLLWIN_THUMBTRACK, wxEVT_SCROLLWIN_THUMBRELEASE}) {
     Bind(type, &ThumbnailCanvas::OnScroll, this);
   }
   Bind(wxEVT_MOUSEWHEEL, &ThumbnailCanvas::OnWheel, this);
@@ -272,7 +272,8 @@ void ThumbnailCanvas::DrawPicture(wxDC& dc, size_t line, const wxRect& square, c
   if (!bitmap.IsOk()) return DrawPlaceholder(dc, item, square, "!", looks);
   // One of another size stands in until the right one comes.
   double shrink = 1;
-  const wxSize size = wxSize(static_cast<int>(std::lround(bitmap.GetLogicalWidth())), static_cast<int>(std::lround(bitmap.GetLogicalHeight())));
+  const wxSize size =
+      wxSize(static_cast<int>(std::lround(bitmap.GetLogicalWidth())), static_cast<int>(std::lround(bitmap.GetLogicalHeight())));
   if (!right) shrink = std::min(1.0, static_cast<double>(square_) / std::max({size.x, size.y, 1}));
   const wxSize shown(std::max(static_cast<int>(size.x * shrink), 1), std::max(static_cast<int>(size.y * shrink), 1));
   const wxPoint corner(square.x + (square.width - shown.x) / 2, square.y + (square.height - shown.y) / 2);
@@ -491,8 +492,8 @@ void ThumbnailCanvas::OnKey(wxKeyEvent& event) {
     Step step;
   };
   constexpr KeyStep kSteps[] = {
-      {WXK_LEFT, Step::Left}, {WXK_RIGHT, Step::Right},   {WXK_UP, Step::Up},           {WXK_DOWN, Step::Down},
-      {WXK_HOME, Step::First}, {WXK_END, Step::Last}, {WXK_PAGEUP, Step::PageUp}, {WXK_PAGEDOWN, Step::PageDown},
+      {WXK_LEFT, Step::Left},  {WXK_RIGHT, Step::Right}, {WXK_UP, Step::Up},         {WXK_DOWN, Step::Down},
+      {WXK_HOME, Step::First}, {WXK_END, Step::Last},    {WXK_PAGEUP, Step::PageUp}, {WXK_PAGEDOWN, Step::PageDown},
   };
   if (event.AltDown()) return event.Skip();
   if (event.GetKeyCode() == WXK_TAB && !event.ControlDown()) {

@@ -23,10 +23,10 @@ class ThumbnailCanvas : public wxWindow {
   // What it tells the browser.
   struct Events {
     std::function<void()> selectionChanged;
-    std::function<void(size_t line)> activated;           // double click
+    std::function<void(size_t line)> activated;                    // double click
     std::function<void(size_t line, const wxPoint&)> contextMenu;  // kNoLine: on empty space; where in the canvas
     std::function<void()> dragBegins;
-    std::function<void(int steps)> resize;                // Ctrl and the wheel
+    std::function<void(int steps)> resize;  // Ctrl and the wheel
     std::function<void(size_t line, const std::string& name)> renamed;
   };
 
@@ -83,7 +83,7 @@ class ThumbnailCanvas : public wxWindow {
   int direction_ = 1;  // of scrolling: what is ahead is loaded first
   int square_ = 96;    // the picture's place in a cell, 0 where there is none
   int textHeight_ = 16;
-  int painted_ = 0;    // 1: anything, 2: files
+  int painted_ = 0;  // 1: anything, 2: files
 
   struct Drawn {
     ThumbnailPointer thumbnail;

@@ -6,8 +6,8 @@ class MainFrame;
 
 // The windows beside browser and view window, as commands of the frame.
 void ShowSetup(MainFrame& frame);
-void ShowInfo(MainFrame& frame);   // of the selected files
-void ShowExif(MainFrame& frame);   // of the first selected file
+void ShowInfo(MainFrame& frame);  // of the selected files
+void ShowExif(MainFrame& frame);  // of the first selected file
 void ShowFileHistory(MainFrame& frame);
 void ShowCompaction(MainFrame& frame);
 void ShowCleanUp(MainFrame& frame);  // of the folder in front

@@ -20,7 +20,8 @@ UpdateBar::UpdateBar(wxWindow* parent, std::function<void(int32_t choice)> answe
   const wxColour window = wxSystemSettings::GetColour(wxSYS_COLOUR_WINDOW);
   const wxColour highlight = wxSystemSettings::GetColour(wxSYS_COLOUR_HIGHLIGHT);
   const auto tint = [](int from, int to) { return static_cast<unsigned char>(from + (to - from) / 7); };
-  SetBackgroundColour(wxColour(tint(window.Red(), highlight.Red()), tint(window.Green(), highlight.Green()), tint(window.Blue(), highlight.Blue())));
+  SetBackgroundColour(wxColour(tint(window.Red(), highlight.Red()), tint(window.Green(), highlight.Green()),
+                               tint(window.Blue(), highlight.Blue())));
   const int gap = FromDIP(6);
   text_ = new wxStaticText(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxST_ELLIPSIZE_END);
   choices_ = new wxChoice(this, wxID_ANY);
@@ -31,7 +32,8 @@ UpdateBar::UpdateBar(wxWindow* parent, std::function<void(int32_t choice)> answe
   }
   auto* ok = new wxButton(this, wxID_OK);
   ok_ = ok;
-  auto* close = new wxButton(this, wxID_CLOSE, wxString::FromUTF8("\xC3\x97"), wxDefaultPosition, FromDIP(wxSize(32, -1)), wxBORDER_NONE);
+  auto* close =
+      new wxButton(this, wxID_CLOSE, wxString::FromUTF8("\xC3\x97"), wxDefaultPosition, FromDIP(wxSize(32, -1)), wxBORDER_NONE);
   close->SetToolTip("Close");
   auto* question = new wxBoxSizer(wxHORIZONTAL);
   question->Add(text_, wxSizerFlags(1).CenterVertical());
@@ -43,9 +45,8 @@ UpdateBar::UpdateBar(wxWindow* parent, std::function<void(int32_t choice)> answe
   sizer->Add(question, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxTOP, gap));
   sizer->Add(answer, wxSizerFlags().Expand().Border(wxALL, gap));
   SetSizer(sizer);
-  ok->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) {
-    answered_(kThumbnailUpdateChoices[static_cast<size_t>(choices_->GetSelection())].value);
-  });
+  ok->Bind(wxEVT_BUTTON,
+           [this](wxCommandEvent&) { answered_(kThumbnailUpdateChoices[static_cast<size_t>(choices_->GetSelection())].value); });
   close->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { answered_(0); });
 }
 

@@ -26,8 +26,8 @@ enum Database { kGlobal, kLocal };
 // --- compaction ---
 
 CompactionBox::CompactionBox(wxWindow* parent, const std::string& folder)
-    : wxDialog(parent, wxID_ANY, "Compact thumbnail database", wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
-               "CompactDatabaseBox"),
+    : wxDialog(parent, wxID_ANY, "Compact thumbnail database", wxDefaultPosition, wxDefaultSize,
+               wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "CompactDatabaseBox"),
       paths_{ThumbnailDatabasePath({}), ThumbnailDatabasePath(folder)} {
   const int gap = FromDIP(10);
   const wxString choices[] = {"&Global database", "&Database of this folder"};
@@ -51,11 +51,15 @@ CompactionBox::CompactionBox(wxWindow* parent, const std::string& folder)
   column->Add(buttons, wxSizerFlags().Expand().Border(wxALL, gap));
   SetSizer(column);
   which_->Bind(wxEVT_RADIOBOX, [this](wxCommandEvent&) { UpdateControls(); });
-  Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { Begin(); }, wxID_OK);
-  Bind(wxEVT_BUTTON, [this](wxCommandEvent&) {
-    if (compaction_ != nullptr && !compaction_->Ended()) return compaction_->Stop();
-    EndModal(wxID_CANCEL);
-  }, wxID_CANCEL);
+  Bind(
+      wxEVT_BUTTON, [this](wxCommandEvent&) { Begin(); }, wxID_OK);
+  Bind(
+      wxEVT_BUTTON,
+      [this](wxCommandEvent&) {
+        if (compaction_ != nullptr && !compaction_->Ended()) return compaction_->Stop();
+        EndModal(wxID_CANCEL);
+      },
+      wxID_CANCEL);
   timer_.Bind(wxEVT_TIMER, [this](wxTimerEvent&) { Look(); });
   UpdateControls();
   Fit();
@@ -97,8 +101,8 @@ void CompactionBox::UpdateControls() {
 // --- clean-up ---
 
 CleanUpBox::CleanUpBox(wxWindow* parent, const std::string& folder)
-    : wxDialog(parent, wxID_ANY, "Clean up thumbnails", wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
-               "CleanUpThumbnailsBox"),
+    : wxDialog(parent, wxID_ANY, "Clean up thumbnails", wxDefaultPosition, wxDefaultSize,
+               wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "CleanUpThumbnailsBox"),
       folder_(folder) {
   const int gap = FromDIP(10);
   auto* place = new wxStaticText(this, wxID_ANY, "Thumbnail files whose pictures are gone, in " + Shown(folder));
@@ -119,7 +123,8 @@ CleanUpBox::CleanUpBox(wxWindow* parent, const std::string& folder)
   column->Add(buttons, wxSizerFlags().Expand().Border(wxALL, gap));
   SetSizerAndFit(column);
   below_->Bind(wxEVT_CHECKBOX, [this](wxCommandEvent&) { Search(); });
-  Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { Delete(); }, wxID_DELETE);
+  Bind(
+      wxEVT_BUTTON, [this](wxCommandEvent&) { Delete(); }, wxID_DELETE);
   CentreOnParent();
   Search();
 }
@@ -128,9 +133,12 @@ void CleanUpBox::Search() {
   FindWindow(wxID_DELETE)->Disable();
   outcome_->SetLabel("Looking...");
   list_->Clear();
-  work_.Start(*this, [this, below = below_->GetValue()](const std::atomic<bool>& stop) {
-    orphans_ = FindOrphanThumbnails(folder_, below, stop);
-  }, [this] { Found(); });
+  work_.Start(
+      *this,
+      [this, below = below_->GetValue()](const std::atomic<bool>& stop) {
+        orphans_ = FindOrphanThumbnails(folder_, below, stop);
+      },
+      [this] { Found(); });
 }
 
 void CleanUpBox::Found() {

@@ -15,8 +15,8 @@
 #include "core/text.h"
 #include "desktop/event_log.h"
 #include "desktop/windows/bitmaps.h"
-#include "desktop/windows/info_frame.h"
 #include "desktop/windows/file_actions.h"
+#include "desktop/windows/info_frame.h"
 #include "desktop/windows/main_frame.h"
 #include "desktop/windows/wx_text.h"
 #include "platform/clock.h"
@@ -147,10 +147,14 @@ ViewFrame::ViewFrame(MainFrame& frame, const std::vector<std::string>& list, con
   canvas_ = new Canvas(*this);
   CreateStatusBar();
   canvas_->SetFocus();
-  Bind(wxEVT_TIMER, [this](wxTimerEvent&) { Step(1); }, slideTimer_.GetId());
-  Bind(wxEVT_TIMER, [this](wxTimerEvent&) {
-    if (IsFullScreen()) canvas_->SetCursor(wxCursor(wxCURSOR_BLANK));
-  }, pointerTimer_.GetId());
+  Bind(
+      wxEVT_TIMER, [this](wxTimerEvent&) { Step(1); }, slideTimer_.GetId());
+  Bind(
+      wxEVT_TIMER,
+      [this](wxTimerEvent&) {
+        if (IsFullScreen()) canvas_->SetCursor(wxCursor(wxCURSOR_BLANK));
+      },
+      pointerTimer_.GetId());
   if (settings.MaximizeViewWindow != 0) Maximize();
   ShowPlace();
 }
@@ -243,9 +247,9 @@ void ViewFrame::TakePicture(ViewPicturePointer picture) {
   }
   TransformChanged();
   if (slideTimer_.IsRunning()) slideTimer_.Start(kSlideMs);
-  LogEvent("view", "place=" + std::to_string(place_ + 1) + "/" + std::to_string(list_.size()) + " page=" + std::to_string(page_ + 1) +
-                       " status=" + std::to_string(StatusNumber(shown_->status)) +
-                       " ms=" + std::to_string(std::lround((platform::MonotonicSeconds() - keyTime_) * 1000)) + " file=" + list_[place_]);
+  LogEvent("view", "place=" + std::to_string(place_ + 1) + "/" + std::to_string(list_.size()) +
+                       " page=" + std::to_string(page_ + 1) + " status=" + std::to_string(StatusNumber(shown_->status)) + " ms=" +
+                       std::to_string(std::lround((platform::MonotonicSeconds() - keyTime_) * 1000)) + " file=" + list_[place_]);
 }
 
 // --- zoom ---
@@ -312,7 +316,8 @@ void ViewFrame::PaintCanvas() {
     dc.SetBackground(wxBrush(background));
     dc.Clear();
     dc.SetTextForeground(*wxBLACK);
-    const wxString text = shown_ == nullptr ? wxString() : Shown(list_[place_] + "\n" + std::string(StatusMessage(shown_->status)));
+    const wxString text =
+        shown_ == nullptr ? wxString() : Shown(list_[place_] + "\n" + std::string(StatusMessage(shown_->status)));
     dc.DrawLabel(text, wxRect(canvas_->GetClientSize()), wxALIGN_CENTER);
   } else {
     RgbImage pixels;
@@ -392,7 +397,8 @@ void ViewFrame::Leave() {
 void ViewFrame::DeleteFile() {
   const std::string path = list_[place_];
   if (settings.PromptDeleteFromView != 0) {
-    wxMessageDialog dialog(this, "Move " + Shown(platform::FileNameOf(path)) + " to the trash?", "Delete", wxOK | wxCANCEL | wxICON_QUESTION);
+    wxMessageDialog dialog(this, "Move " + Shown(platform::FileNameOf(path)) + " to the trash?", "Delete",
+                           wxOK | wxCANCEL | wxICON_QUESTION);
     dialog.SetOKLabel("&Delete");
     if (dialog.ShowModal() != wxID_OK) return;
   }
@@ -451,7 +457,8 @@ void ViewFrame::ShowMenu(const wxPoint& place) {
     const int id = wxID_HIGHEST + 1 + static_cast<int>(&command - kViewCommands);
     // Shown beside the text; the key itself is the canvas's.
     menu.Append(id, wxString(command.text) + "    " + command.shownKey);
-    menu.Bind(wxEVT_MENU, [this, run = command.run](wxCommandEvent&) { run(*this); }, id);
+    menu.Bind(
+        wxEVT_MENU, [this, run = command.run](wxCommandEvent&) { run(*this); }, id);
   }
   canvas_->PopupMenu(&menu, place);
 }

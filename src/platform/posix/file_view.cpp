@@ -19,8 +19,8 @@ namespace fotomill::platform {
 
 namespace {
 
-constexpr uint64_t kMappedFrom = 256 * 1024;         // up to here one read is cheaper than a mapping
-constexpr uint64_t kDropStep = uint64_t{2} << 20;    // bytes given back at a time
+constexpr uint64_t kMappedFrom = 256 * 1024;       // up to here one read is cheaper than a mapping
+constexpr uint64_t kDropStep = uint64_t{2} << 20;  // bytes given back at a time
 constexpr size_t kMostMappings = 256;
 
 // The mapped views. A mapping whose file was cut short raises SIGBUS when the lost part is touched; the handler puts
@@ -112,9 +112,8 @@ bool FileView::OpenPart(const char* path, uint64_t most) {
   fileSize_ = static_cast<uint64_t>(facts.st_size);
   size_ = std::min(fileSize_, most);
   if (size_ >= kMappedFrom && Map()) return true;
-  const int64_t count = FaultDue() || !copy_.Allocate(size_, Fill::Unset)
-                            ? -1
-                            : ReadFully(static_cast<int>(handle_), copy_.Data(), size_, 0);
+  const int64_t count =
+      FaultDue() || !copy_.Allocate(size_, Fill::Unset) ? -1 : ReadFully(static_cast<int>(handle_), copy_.Data(), size_, 0);
   if (count < 0) {
     Close();
     return false;
@@ -145,8 +144,8 @@ bool FileView::ReadAt(uint64_t offset, std::span<uint8_t> into) const {
     if (!into.empty()) std::memcpy(into.data(), data_ + offset, into.size());
     return true;
   }
-  const int64_t count = FaultDue() ? -1
-                                   : ReadFully(static_cast<int>(handle_), into.data(), into.size(), static_cast<int64_t>(offset));
+  const int64_t count =
+      FaultDue() ? -1 : ReadFully(static_cast<int>(handle_), into.data(), into.size(), static_cast<int64_t>(offset));
   return count == static_cast<int64_t>(into.size());
 }
 

@@ -86,16 +86,11 @@ std::string UserFolder(std::string_view key, std::string_view usualName) {
 
 std::string SpecialFolderPath(SpecialFolder folder) {
   switch (folder) {
-    case SpecialFolder::ApplicationData:
-      return FolderOrHomeChild("XDG_CONFIG_HOME", ".config");
-    case SpecialFolder::Cache:
-      return FolderOrHomeChild("XDG_CACHE_HOME", ".cache");
-    case SpecialFolder::Home:
-      return HomeFolder();
-    case SpecialFolder::Pictures:
-      return UserFolder("XDG_PICTURES_DIR", "Pictures");
-    case SpecialFolder::Documents:
-      return UserFolder("XDG_DOCUMENTS_DIR", "Documents");
+    case SpecialFolder::ApplicationData: return FolderOrHomeChild("XDG_CONFIG_HOME", ".config");
+    case SpecialFolder::Cache: return FolderOrHomeChild("XDG_CACHE_HOME", ".cache");
+    case SpecialFolder::Home: return HomeFolder();
+    case SpecialFolder::Pictures: return UserFolder("XDG_PICTURES_DIR", "Pictures");
+    case SpecialFolder::Documents: return UserFolder("XDG_DOCUMENTS_DIR", "Documents");
     case SpecialFolder::Temporary: {
       const std::string temporary = FolderFromEnvironment("TMPDIR");
       return IsFolder(temporary) ? temporary : "/tmp";

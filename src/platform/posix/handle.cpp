@@ -75,8 +75,8 @@ int64_t ReadFully(int handle, uint8_t* data, uint64_t size, int64_t offset) {
   uint64_t done = 0;
   while (done < size) {
     const size_t part = static_cast<size_t>(std::min(size - done, kMostAtOnce));
-    const ssize_t count = offset < 0 ? read(handle, data + done, part)
-                                     : pread(handle, data + done, part, offset + static_cast<int64_t>(done));
+    const ssize_t count =
+        offset < 0 ? read(handle, data + done, part) : pread(handle, data + done, part, offset + static_cast<int64_t>(done));
     if (count < 0 && errno == EINTR) continue;
     if (count < 0) return -1;
     if (count == 0) break;
@@ -89,8 +89,8 @@ bool WriteFully(int handle, const uint8_t* data, uint64_t size, int64_t offset) 
   uint64_t done = 0;
   while (done < size) {
     const size_t part = static_cast<size_t>(std::min(size - done, kMostAtOnce));
-    const ssize_t count = offset < 0 ? write(handle, data + done, part)
-                                     : pwrite(handle, data + done, part, offset + static_cast<int64_t>(done));
+    const ssize_t count =
+        offset < 0 ? write(handle, data + done, part) : pwrite(handle, data + done, part, offset + static_cast<int64_t>(done));
     if (count < 0 && errno == EINTR) continue;
     if (count <= 0) return false;
     done += static_cast<uint64_t>(count);

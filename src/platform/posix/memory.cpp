@@ -70,9 +70,7 @@ constinit BlockPool pool{};
 
 uint64_t RoundUp(uint64_t size, uint64_t unit) { return (size + unit - 1) / unit * unit; }
 
-uint64_t CapacityFor(uint64_t size) {
-  return RoundUp(size + kGuard, size >= 2 * kHugePage ? kHugePage : kSmallUnit);
-}
+uint64_t CapacityFor(uint64_t size) { return RoundUp(size + kGuard, size >= 2 * kHugePage ? kHugePage : kSmallUnit); }
 
 void Unmap(FreeBlock block) {
   AllowBytes(block.data, block.capacity, block.capacity);

@@ -48,7 +48,8 @@ bool IsOctalDigit(char c) { return c >= '0' && c <= '7'; }
 std::string DecodeOctal(std::string_view text) {
   std::string result;
   for (size_t i = 0; i < text.size(); ++i) {
-    if (text[i] == '\\' && i + 3 < text.size() && IsOctalDigit(text[i + 1]) && IsOctalDigit(text[i + 2]) && IsOctalDigit(text[i + 3])) {
+    if (text[i] == '\\' && i + 3 < text.size() && IsOctalDigit(text[i + 1]) && IsOctalDigit(text[i + 2]) &&
+        IsOctalDigit(text[i + 3])) {
       result += static_cast<char>((text[i + 1] - '0') << 6 | (text[i + 2] - '0') << 3 | (text[i + 3] - '0'));
       i += 3;
     } else {

@@ -30,9 +30,7 @@ bool IsNoName(const std::string& path, int error) {
   return (error == ENOENT || error == ENOTDIR) && (lstat(path.c_str(), &facts) != 0 || !S_ISLNK(facts.st_mode));
 }
 
-int64_t Nanoseconds(const struct stat& facts) {
-  return int64_t{facts.st_mtim.tv_sec} * 1'000'000'000 + facts.st_mtim.tv_nsec;
-}
+int64_t Nanoseconds(const struct stat& facts) { return int64_t{facts.st_mtim.tv_sec} * 1'000'000'000 + facts.st_mtim.tv_nsec; }
 
 bool InRange(uint64_t offset, size_t size) { return offset <= INT64_MAX && size <= INT64_MAX - offset; }
 
@@ -106,7 +104,8 @@ bool StoreFile::ReadAt(uint64_t offset, std::span<uint8_t> first, std::span<uint
 bool StoreFile::WriteAt(uint64_t offset, std::span<const uint8_t> first, std::span<const uint8_t> second) {
   const size_t size = first.size() + second.size();
   if (!IsOpen() || !InRange(offset, size) || FaultDue()) return false;
-  const iovec parts[] = {{const_cast<uint8_t*>(first.data()), first.size()}, {const_cast<uint8_t*>(second.data()), second.size()}};
+  const iovec parts[] = {{const_cast<uint8_t*>(first.data()), first.size()},
+                         {const_cast<uint8_t*>(second.data()), second.size()}};
   if (pwritev(static_cast<int>(handle_), parts, 2, static_cast<off_t>(offset)) == static_cast<ssize_t>(size)) return true;
   return WriteAt(offset, first) && WriteAt(offset + first.size(), second);  // it was interrupted, or there is no room
 }

@@ -34,8 +34,8 @@ namespace fotomill::platform {
 
 namespace {
 
-constexpr int kAttempts = 10'000;           // names tried for one file
-constexpr size_t kLongestBase = 200;        // bytes kept of a long name; number, extension and ".trashinfo" follow
+constexpr int kAttempts = 10'000;     // names tried for one file
+constexpr size_t kLongestBase = 200;  // bytes kept of a long name; number, extension and ".trashinfo" follow
 constexpr size_t kLongestExtension = 24;
 
 // What is to go: its folder without links and its own name.

@@ -31,8 +31,7 @@ void PrepareChild(pid_t parent, unsigned seconds) {
   setrlimit(RLIMIT_CORE, &none);
   setrlimit(RLIMIT_CPU, &time);
   for (const int signal : {SIGSEGV, SIGABRT, SIGFPE, SIGILL}) std::signal(signal, SIG_DFL);
-  for (const int signal : {SIGINT, SIGTERM})
-    std::signal(signal, SIG_IGN);  // the program decides what becomes of its work
+  for (const int signal : {SIGINT, SIGTERM}) std::signal(signal, SIG_IGN);  // the program decides what becomes of its work
 }
 
 void Tell(int pipe, int32_t number) {
