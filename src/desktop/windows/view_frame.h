@@ -8,7 +8,7 @@
 #include <vector>
 
 #include "desktop/view_picture.h"
-#include "desktop/view_transform.h"
+#include "desktop/windows/view_canvas.h"
 
 namespace fotomill::desktop {
 
@@ -24,10 +24,6 @@ class ViewFrame : public wxFrame {
   void Step(int files);
   void GoTo(size_t place);
   void StepPage(int pages);
-  void ZoomIn() { ZoomBy(ViewTransform::kStep); }
-  void ZoomOut() { ZoomBy(1 / ViewTransform::kStep); }
-  void SetZoom(ZoomMode mode);
-  void ZoomActual();
   void ToggleFullScreen();
   void ToggleSlideshow();
   void ToggleOverlay();
@@ -36,46 +32,35 @@ class ViewFrame : public wxFrame {
   void DeleteFile();  // to the trash; the next one is shown
   void ShowInfoWindow();
   size_t LastPlace() const { return list_.size() - 1; }
-  bool CanPan() const { return transform_.CanPan(); }
-  void PanBy(int stepsAcross, int stepsDown);
+  ViewCanvas& Canvas() { return *canvas_; }
 
  private:
-  class Canvas;
-  void BuildMenu();
   void ShowPlace();
-  void ShowPreview();
+  void ShowStandIn();
   void WantPictures();
   void PictureCame();
-  void ScaledCame();
   void TakePicture(ViewPicturePointer picture);
-  void ZoomBy(double factor, double x = -1, double y = -1);
-  void TransformChanged();
-  void UpdateTitle();
+  void ViewChanged();
   ViewWish WishOf(size_t place) const;
+  bool IsCurrent(const ViewPicturePointer& picture) const;
   std::string StatusLine() const;
   void HidePointerLater();
   void OnKey(wxKeyEvent& event);
+  bool PanByKey(int key);
   void ShowMenu(const wxPoint& place);
-  void PaintCanvas();
   void LogPaint();
-  const PackedImage* BestSource() const;
 
   MainFrame& frame_;
   std::vector<std::string> list_;
   size_t place_ = 0;
   int32_t page_ = 0;
-  ViewPicturePointer shown_;  // what is on the screen; of another place until the wanted one comes
-  std::unique_ptr<ViewScaler::Scaled> scaled_;
-  PackedImage preview_;  // the browser's thumbnail, which is on the screen until the picture comes; else empty
-  ViewTransform transform_;
   double keyTime_ = 0;  // when the picture that is awaited was asked for
   bool overlay_ = false;
   std::string painted_;  // what the log was told of
   wxTimer slideTimer_;
   wxTimer pointerTimer_;
-  Canvas* canvas_ = nullptr;
+  ViewCanvas* canvas_ = nullptr;
   std::unique_ptr<ViewLoader> loader_;
-  std::unique_ptr<ViewScaler> scaler_;
 };
 
 }  // namespace fotomill::desktop

@@ -1,0 +1,203 @@
+#include "desktop/windows/view_canvas.h"
+
+#include <wx/dcclient.h>
+
+#include <cmath>
+
+#include "core/choice_lists.h"
+#include "core/settings.h"
+#include "desktop/windows/bitmaps.h"
+#include "desktop/windows/wx_text.h"
+#include "platform/paths.h"
+#include "processing/scale.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+constexpr int kPanSteps = 8;          // across the window
+constexpr double kPlainPixelsAt = 2;  // from this zoom on pixels are squares
+
+wxColour ColourOf(int32_t color) {
+  return {static_cast<unsigned char>(color), static_cast<unsigned char>(color >> 8), static_cast<unsigned char>(color >> 16)};
+}
+
+}  // namespace
+
+ViewCanvas::ViewCanvas(wxWindow* parent, Events events) : events_(std::move(events)) {
+  SetBackgroundStyle(wxBG_STYLE_PAINT);
+  Create(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxWANTS_CHARS | wxBORDER_NONE, "Picture");
+  scaler_ = std::make_unique<ViewScaler>([this] { CallAfter([this] { ScaledCame(); }); });
+  transform_.SetModeFromKey(settings.DefaultViewZoom);
+  Bind(wxEVT_PAINT, &ViewCanvas::OnPaint, this);
+  Bind(wxEVT_SIZE, &ViewCanvas::OnSize, this);
+  Bind(wxEVT_MOUSEWHEEL, &ViewCanvas::OnWheel, this);
+  Bind(wxEVT_LEFT_DOWN, &ViewCanvas::OnLeftDown, this);
+  Bind(wxEVT_LEFT_UP, &ViewCanvas::OnLeftUp, this);
+  Bind(wxEVT_LEFT_DCLICK, &ViewCanvas::OnDoubleClick, this);
+  Bind(wxEVT_MOTION, &ViewCanvas::OnMotion, this);
+  Bind(wxEVT_MOUSE_CAPTURE_LOST, [](wxMouseCaptureLostEvent&) {});
+}
+
+ViewCanvas::~ViewCanvas() { scaler_.reset(); }  // its thread calls back into this window
+
+void ViewCanvas::Show(ViewPicturePointer picture) {
+  picture_ = std::move(picture);
+  scaled_.reset();
+  standIn_.Free();
+  if (Showable()) transform_.SetPicture(picture_->picture->image.Width(), picture_->picture->image.Height());
+  TransformChanged();
+}
+
+void ViewCanvas::ShowStandIn(PackedImage image, int32_t width, int32_t height) {
+  standIn_ = std::move(image);
+  transform_.SetPicture(width, height);
+  Refresh();
+}
+
+void ViewCanvas::SetOverlay(const std::string& text) {
+  if (text == overlay_) return;
+  overlay_ = text;
+  Refresh();
+}
+
+// --- zoom ---
+
+void ViewCanvas::ZoomBy(double factor) {
+  const wxSize size = DeviceSize();
+  transform_.ZoomBy(factor, size.x / 2.0, size.y / 2.0);
+  TransformChanged();
+}
+
+void ViewCanvas::ZoomActual() {
+  transform_.ZoomToMiddle(1);
+  TransformChanged();
+}
+
+void ViewCanvas::SetZoom(ZoomMode mode) {
+  transform_.SetMode(mode);
+  TransformChanged();
+}
+
+void ViewCanvas::PanBy(int stepsAcross, int stepsDown) {
+  const wxSize size = DeviceSize();
+  transform_.Pan(-static_cast<double>(stepsAcross) * size.x / kPanSteps, -static_cast<double>(stepsDown) * size.y / kPanSteps);
+  Refresh();
+}
+
+// The picture is drawn at once from what there is; a smaller scale then gets pixels that are made for it.
+void ViewCanvas::TransformChanged() {
+  if (standIn_.Empty() && Showable() && transform_.Scale() < 1) {
+    const PackedImage& source = BestSource();
+    const bool exact = source.Width() == transform_.ShownWidth() && source.Height() == transform_.ShownHeight();
+    if (!exact) scaler_->Request(picture_, transform_.ShownWidth(), transform_.ShownHeight());
+  }
+  events_.changed();
+  Refresh();
+}
+
+void ViewCanvas::ScaledCame() {
+  std::unique_ptr<ViewScaler::Scaled> scaled = scaler_->Take();
+  if (scaled == nullptr || scaled->picture != picture_) return;
+  scaled_ = std::move(scaled);
+  Refresh();
+}
+
+const PackedImage& ViewCanvas::BestSource() const {
+  const auto fits = [this](const PackedImage& image) {
+    return image.Width() == transform_.ShownWidth() && image.Height() == transform_.ShownHeight();
+  };
+  if (fits(picture_->fitted)) return picture_->fitted;
+  if (scaled_ != nullptr && fits(scaled_->image)) return scaled_->image;
+  return picture_->picture->image;
+}
+
+// --- painting ---
+
+void ViewCanvas::OnPaint(wxPaintEvent&) {
+  wxPaintDC dc(this);
+  if (DeviceSize().x < 1 || DeviceSize().y < 1) return;
+  if (standIn_.Empty() && !Showable()) {
+    PaintMessage(dc);
+  } else {
+    PaintPicture(dc);
+  }
+  if (!overlay_.empty()) PaintOverlay(dc);
+  if (standIn_.Empty() && Showable()) events_.painted();
+}
+
+void ViewCanvas::PaintPicture(wxDC& dc) {
+  const wxSize size = DeviceSize();
+  RgbImage pixels;
+  pixels.width = size.x;
+  pixels.height = size.y;
+  pixels.bytes.resize(static_cast<size_t>(size.x) * static_cast<size_t>(size.y) * 3);
+  const bool smooth = transform_.Scale() < kPlainPixelsAt && ScaleFilterFromKey(settings.ResizeFilter) != ScaleFilter::Nearest;
+  DrawView(standIn_.Empty() ? BestSource() : standIn_, transform_, static_cast<Color>(settings.ViewModeBackground), smooth,
+           pixels);
+  dc.DrawBitmap(BitmapOf(pixels, GetContentScaleFactor()), 0, 0);
+}
+
+void ViewCanvas::PaintMessage(wxDC& dc) const {
+  dc.SetBackground(wxBrush(ColourOf(settings.ViewModeBackground)));
+  dc.Clear();
+  if (picture_ == nullptr) return;
+  dc.SetTextForeground(*wxBLACK);
+  const std::string name(platform::FileNameOf(picture_->wish.path));
+  dc.DrawLabel(Shown(name + "\n" + std::string(StatusMessage(picture_->status))), wxRect(GetClientSize()), wxALIGN_CENTER);
+}
+
+void ViewCanvas::PaintOverlay(wxDC& dc) const {
+  const wxString text = Shown(overlay_);
+  const wxSize extent = dc.GetMultiLineTextExtent(text) + FromDIP(wxSize(20, 10));
+  dc.SetPen(*wxTRANSPARENT_PEN);
+  dc.SetBrush(wxBrush(wxColour(0, 0, 0, 170)));
+  dc.DrawRoundedRectangle(wxPoint(FromDIP(12), FromDIP(12)), extent, FromDIP(6));
+  dc.SetTextForeground(*wxWHITE);
+  dc.DrawText(text, FromDIP(22), FromDIP(17));
+}
+
+// --- mouse ---
+
+void ViewCanvas::OnSize(wxSizeEvent&) {
+  const wxSize size = DeviceSize();
+  transform_.SetWindow(size.x, size.y);
+  events_.resized();
+  TransformChanged();
+}
+
+void ViewCanvas::OnWheel(wxMouseEvent& event) {
+  if (event.GetWheelRotation() == 0 || event.GetWheelDelta() == 0) return;
+  const wxPoint place = event.GetPosition() * GetContentScaleFactor();
+  const double steps = static_cast<double>(event.GetWheelRotation()) / event.GetWheelDelta();
+  transform_.ZoomBy(std::pow(ViewTransform::kStep, steps), place.x, place.y);
+  TransformChanged();
+}
+
+void ViewCanvas::OnLeftDown(wxMouseEvent& event) {
+  drag_ = event.GetPosition();
+  SetFocus();
+  CaptureMouse();
+}
+
+void ViewCanvas::OnLeftUp(wxMouseEvent&) {
+  if (HasCapture()) ReleaseMouse();
+}
+
+void ViewCanvas::OnMotion(wxMouseEvent& event) {
+  event.Skip();
+  if (!HasCapture()) return;
+  const wxPoint way = (event.GetPosition() - drag_) * GetContentScaleFactor();
+  drag_ = event.GetPosition();
+  transform_.Pan(way.x, way.y);
+  Refresh();
+}
+
+void ViewCanvas::OnDoubleClick(wxMouseEvent& event) {
+  if (transform_.Mode() == ZoomMode::Free) return SetZoom(ZoomMode::Fit);
+  const wxPoint place = event.GetPosition() * GetContentScaleFactor();
+  transform_.ZoomTo(1, place.x, place.y);
+  TransformChanged();
+}
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,74 @@
+#include "desktop/windows/view_commands.h"
+
+#include <wx/defs.h>
+
+#include <algorithm>
+
+#include "desktop/windows/view_frame.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+template <int step>
+void Step(ViewFrame& view) {
+  view.Step(step);
+}
+template <int step>
+void StepPage(ViewFrame& view) {
+  view.StepPage(step);
+}
+template <ZoomMode mode>
+void Zoom(ViewFrame& view) {
+  view.Canvas().SetZoom(mode);
+}
+template <void (ViewFrame::*action)()>
+void Of(ViewFrame& view) {
+  (view.*action)();
+}
+template <void (ViewCanvas::*action)()>
+void OfCanvas(ViewFrame& view) {
+  (view.Canvas().*action)();
+}
+void First(ViewFrame& view) { view.GoTo(0); }
+void Last(ViewFrame& view) { view.GoTo(view.LastPlace()); }
+
+// clang-format off
+constexpr ViewCommand kCommands[] = {
+    {"&Next",             "Space",     {WXK_SPACE, WXK_PAGEDOWN, 'N'},  Step<1>},
+    {"&Previous",         "Backspace", {WXK_BACK, WXK_PAGEUP, 'P'},     Step<-1>},
+    {"&First",            "Home",      {WXK_HOME},                      First},
+    {"&Last",             "End",       {WXK_END},                       Last},
+    {nullptr, nullptr, {}, nullptr},
+    {"Zoom &in",          "+",         {'+', '=', WXK_NUMPAD_ADD},      OfCanvas<&ViewCanvas::ZoomIn>},
+    {"Zoom &out",         "-",         {'-', WXK_NUMPAD_SUBTRACT},      OfCanvas<&ViewCanvas::ZoomOut>},
+    {"Fit to &window",    "0",         {'0', WXK_NUMPAD0},              Zoom<ZoomMode::Fit>},
+    {"&Actual size",      "1",         {'1', WXK_NUMPAD1},              OfCanvas<&ViewCanvas::ZoomActual>},
+    {"Fit to wi&dth",     "2",         {'2', WXK_NUMPAD2},              Zoom<ZoomMode::FitWidth>},
+    {"Fi&ll the window",  "3",         {'3', WXK_NUMPAD3},              Zoom<ZoomMode::Fill>},
+    {nullptr, nullptr, {}, nullptr},
+    {"Next pa&ge",        "]",         {']'},                           StepPage<1>},
+    {"Pre&vious page",    "[",         {'['},                           StepPage<-1>},
+    {nullptr, nullptr, {}, nullptr},
+    {"Full &screen",      "F11",       {WXK_F11, 'F'},                  Of<&ViewFrame::ToggleFullScreen>},
+    {"Slides&how",        "S",         {'S', WXK_F8},                   Of<&ViewFrame::ToggleSlideshow>},
+    {"In&formation",      "I",         {'I'},                           Of<&ViewFrame::ToggleOverlay>},
+    {"G&et info...",      "Alt+Enter", {},                              Of<&ViewFrame::ShowInfoWindow>},
+    {nullptr, nullptr, {}, nullptr},
+    {"&Delete",           "Del",       {WXK_DELETE},                    Of<&ViewFrame::DeleteFile>},
+    {"&Copy picture",     "Ctrl+C",    {WXK_CONTROL_C},                 Of<&ViewFrame::CopyPicture>},
+    {"&Close",            "Esc",       {WXK_ESCAPE, WXK_RETURN, WXK_NUMPAD_ENTER}, Of<&ViewFrame::Leave>},
+};
+// clang-format on
+
+}  // namespace
+
+std::span<const ViewCommand> ViewCommands() { return kCommands; }
+
+const ViewCommand* ViewCommandOfKey(int key) {
+  const auto has = [key](const ViewCommand& command) { return std::ranges::find(command.keys, key) != std::end(command.keys); };
+  const auto* found = key == 0 ? std::end(kCommands) : std::ranges::find_if(kCommands, has);
+  return found == std::end(kCommands) ? nullptr : found;
+}
+
+}  // namespace fotomill::desktop
