@@ -1,26 +1,22 @@
 #include "desktop/windows/browser_page.h"
 
-#include <wx/bmpbuttn.h>
 #include <wx/dataobj.h>
 #include <wx/dnd.h>
-#include <wx/filename.h>
 #include <wx/simplebook.h>
 #include <wx/sizer.h>
 #include <wx/srchctrl.h>
-#include <wx/textctrl.h>
+#include <wx/textdlg.h>
 
 #include <algorithm>
 
 #include "core/choice_lists.h"
-#include "core/settings.h"
 #include "desktop/event_log.h"
-#include "desktop/windows/bitmaps.h"
 #include "desktop/windows/details_list.h"
 #include "desktop/windows/folder_drop.h"
+#include "desktop/windows/path_bar.h"
 #include "desktop/windows/thumbnail_canvas.h"
 #include "desktop/windows/update_bar.h"
 #include "desktop/windows/wx_text.h"
-#include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
 
@@ -28,8 +24,6 @@ namespace fotomill::desktop {
 
 namespace {
 
-constexpr int kGatherMs = 300;  // changes of a folder are gathered for so long
-constexpr size_t kMostHistory = 100;
 enum View { kThumbnailView, kDetailsView };  // pages of the book, the second made when it is first shown
 
 }  // namespace
@@ -38,84 +32,35 @@ BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& 
     : wxPanel(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTAB_TRAVERSAL | wxBORDER_NONE, "Browser"),
       host_(host),
       thumbnails_(thumbnails),
-      reloadTimer_(this) {
+      reader_({[this](FolderListing listing, bool complete) { TakeListing(std::move(listing), complete); },
+               [this](const PlacedItems& found, bool last) { TakeFacts(found, last); }}),
+      watch_([this] { Reload(); }),
+      offer_(this, {[this] { FocusList(); }, [this] { canvas_->WantThumbnails(); }}) {
   model_.SetModes(modes);
-  BuildPathBar();
-  views_ = new wxSimplebook(this);
-  const auto selected = [this] { host_.BrowserChanged(); };
-  const auto menu = [this](wxWindow& window, size_t line, const wxPoint& place) {
-    host_.ShowContextMenu(window, place, line != kNoLine);
-  };
-  ThumbnailCanvas::Events events;
-  events.selectionChanged = selected;
-  events.activated = [this](size_t line) { Activate(line); };
-  events.contextMenu = [this, menu](size_t line, const wxPoint& place) { menu(*canvas_, line, place); };
-  events.dragBegins = [this] { BeginDrag(); };
-  events.resize = [this](int steps) { ChangeSize(steps); };
-  events.renamed = [this](size_t line, const std::string& name) { host_.RenameFile(model_.PathOfLine(line), name); };
-  canvas_ = new ThumbnailCanvas(views_, model_, thumbnails_, events);
-  views_->AddPage(canvas_, "Thumbnails");
-  auto* sizer = new wxBoxSizer(wxVERTICAL);
   auto* bar = new wxBoxSizer(wxHORIZONTAL);
-  const int gap = FromDIP(4);
-  const auto button = [&](const char* symbol, const char* tip, auto run) {
-    auto* made = new wxBitmapButton(this, wxID_ANY, Symbol(symbol), wxDefaultPosition, wxDefaultSize, wxBORDER_NONE,
-                                    wxDefaultValidator, tip);
-    made->SetToolTip(tip);
-    made->Bind(wxEVT_BUTTON, [run](wxCommandEvent&) { run(); });
-    bar->Add(made, wxSizerFlags().CenterVertical().Border(wxLEFT, gap));
-    return made;
-  };
-  back_ = button("back", "Back", [this] { GoBack(); });
-  forward_ = button("forward", "Forward", [this] { GoForward(); });
-  button("up", "Parent folder", [this] { GoUp(); });
-  bar->Add(path_, wxSizerFlags(1).CenterVertical().Border(wxALL, gap));
-  bar->Add(filter_, wxSizerFlags().CenterVertical().Border(wxRIGHT, gap));
+  path_ = new PathBar(this, {[this](int steps) { StepAlongTrail(steps); }, [this] { GoUp(); },
+                             [this](const std::string& folder) {
+                               Open(folder);
+                               FocusList();
+                             },
+                             [this] { LeaveBar(); }});
+  bar->Add(path_, wxSizerFlags(1).CenterVertical());
+  BuildFilter();
+  bar->Add(filter_, wxSizerFlags().CenterVertical().Border(wxRIGHT, FromDIP(4)));
+  BuildViews();
+  auto* sizer = new wxBoxSizer(wxVERTICAL);
   sizer->Add(bar, wxSizerFlags().Expand());
-  updateBar_ = new UpdateBar(this, [this](int32_t choice) {
-    if (offer_ != nullptr) offer_->Answer(choice);
-    ShowUpdateBar(false);
-    FocusList();
-  });
-  updateBar_->Hide();
-  updateBar_->MoveBeforeInTabOrder(views_);
-  sizer->Add(updateBar_, wxSizerFlags().Expand());
+  offer_.Bar()->MoveBeforeInTabOrder(views_);
+  sizer->Add(offer_.Bar(), wxSizerFlags().Expand());
   sizer->Add(views_, wxSizerFlags(1).Expand());
   SetSizer(sizer);
   SetDropTarget(new FolderDrop([this](const wxPoint&) { return model_.Folder(); },
                                [this](const std::vector<std::string>& files, const std::string& folder, bool move) {
                                  host_.DropFiles(files, folder, move);
                                }));
-  Bind(wxEVT_TIMER, [this](wxTimerEvent&) { Reload(); });
-  Bind(wxEVT_FSWATCHER, [this](wxFileSystemWatcherEvent& event) {
-    constexpr int kNoChange = wxFSW_EVENT_ACCESS | wxFSW_EVENT_WARNING | wxFSW_EVENT_ERROR;
-    if ((event.GetChangeType() & kNoChange) == 0 && !reloadTimer_.IsRunning()) reloadTimer_.StartOnce(kGatherMs);
-  });
 }
 
-BrowserPage::~BrowserPage() {
-  StopListing();
-  StopOffer();
-}
-
-void BrowserPage::BuildPathBar() {
-  path_ = new wxTextCtrl(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxTE_PROCESS_ENTER, wxDefaultValidator, "Folder");
-  path_->AutoCompleteDirectories();
-  path_->Bind(wxEVT_TEXT_ENTER, [this](wxCommandEvent&) {
-    std::string folder = Utf8(path_->GetValue());
-    if (folder.starts_with('~')) folder.replace(0, 1, Utf8(wxGetHomeDir()));
-    folder = platform::AbsolutePath(folder);
-    if (!platform::IsFolder(folder)) return wxBell();
-    Open(folder);
-    FocusList();
-  });
-  const auto leave = [this](wxKeyEvent& event) {
-    if (event.GetKeyCode() != WXK_ESCAPE) return event.Skip();
-    path_->ChangeValue(Shown(model_.Folder()));
-    if (!filter_->IsEmpty()) filter_->Clear();
-    FocusList();
-  };
-  path_->Bind(wxEVT_KEY_DOWN, leave);
+void BrowserPage::BuildFilter() {
   filter_ = new wxSearchCtrl(this, wxID_ANY, "", wxDefaultPosition, FromDIP(wxSize(200, -1)), wxTE_PROCESS_ENTER,
                              wxDefaultValidator, "Filter");
   filter_->SetDescriptiveText("Filter");
@@ -124,45 +69,36 @@ void BrowserPage::BuildPathBar() {
   filter_->Bind(wxEVT_TEXT, [this](wxCommandEvent&) { ApplyFilter(); });
   filter_->Bind(wxEVT_SEARCHCTRL_CANCEL_BTN, [this](wxCommandEvent&) { filter_->Clear(); });
   filter_->Bind(wxEVT_TEXT_ENTER, [this](wxCommandEvent&) { FocusList(); });
-  filter_->Bind(wxEVT_CHAR_HOOK, leave);
+  filter_->Bind(wxEVT_CHAR_HOOK, [this](wxKeyEvent& event) {
+    if (event.GetKeyCode() != WXK_ESCAPE) return event.Skip();
+    LeaveBar();
+  });
+}
+
+void BrowserPage::BuildViews() {
+  views_ = new wxSimplebook(this);
+  ThumbnailCanvas::Events events;
+  events.selectionChanged = [this] { host_.BrowserChanged(); };
+  events.activated = [this](size_t line) { Activate(line); };
+  events.contextMenu = [this](size_t line, const wxPoint& place) { host_.ShowContextMenu(*canvas_, place, line != kNoLine); };
+  events.dragBegins = [this] { BeginDrag(); };
+  events.resize = [this](int steps) { ChangeSize(steps); };
+  events.renamed = [this](size_t line, const std::string& name) { host_.RenameFile(model_.PathOfLine(line), name); };
+  canvas_ = new ThumbnailCanvas(views_, model_, thumbnails_, events);
+  views_->AddPage(canvas_, "Thumbnails");
 }
 
 // --- folders ---
 
-void BrowserPage::Open(const std::string& folder, const std::string& focus, bool fromHistory) {
-  const bool same = folder == model_.Folder();
-  wantedFocus_ = focus;
-  if (same) return Reload();
-  if (!fromHistory) {
-    if (!history_.empty()) history_.resize(historyPlace_ + 1);
-    history_.push_back(folder);
-    if (history_.size() > kMostHistory) history_.erase(history_.begin());
-    historyPlace_ = history_.size() - 1;
-  }
-  StopOffer();
-  offered_ = false;
-  ShowUpdateBar(false);
-  model_.SetFolder(folder);
-  model_.SetModes(ModesForFolder(folder, model_.Modes()));
-  filter_->ChangeValue("");
-  path_->ChangeValue(Shown(folder));
-  canvas_->ScrollTo(0);
-  ShowView();
-  StartListing();
-  watcher_.reset();
-  host_.BrowserChanged();
+void BrowserPage::Open(const std::string& folder, const std::string& focus) {
+  if (folder != model_.Folder()) trail_.Go(folder);
+  ShowFolder(folder, focus);
 }
 
-void BrowserPage::Reload() { StartListing(); }
-
-void BrowserPage::GoBack() {
-  if (!CanGoBack()) return;
-  const std::string child(platform::FileNameOf(model_.Folder()));
-  Open(history_[--historyPlace_], child, true);
-}
-
-void BrowserPage::GoForward() {
-  if (CanGoForward()) Open(history_[++historyPlace_], {}, true);
+void BrowserPage::StepAlongTrail(int steps) {
+  if (!trail_.CanStep(steps)) return;
+  const std::string left(platform::FileNameOf(model_.Folder()));
+  ShowFolder(trail_.Step(steps), steps < 0 ? left : std::string());
 }
 
 void BrowserPage::GoUp() {
@@ -170,51 +106,39 @@ void BrowserPage::GoUp() {
   if (parent != model_.Folder()) Open(parent, std::string(platform::FileNameOf(model_.Folder())));
 }
 
-void BrowserPage::StopListing() {
-  if (factsJob_ != nullptr) factsJob_->stop = true;
-  factsJob_.reset();
-  if (job_ != nullptr) job_->stop = true;
-  job_.reset();
+void BrowserPage::ShowFolder(const std::string& folder, const std::string& focus) {
+  wantedFocus_ = focus;
+  if (folder == model_.Folder()) return Reload();
+  watch_.Watch({});
+  offer_.Forget();
+  model_.SetFolder(folder);
+  model_.SetModes(ModesForFolder(folder, model_.Modes()));
+  filter_->ChangeValue("");
+  path_->ShowFolder(folder);
+  canvas_->ScrollTo(0);
+  ShowView();
+  Reload();
+  host_.BrowserChanged();
 }
 
-// Names come first, then sizes and times, so that even a folder of 100,000 files appears at once. The thread is not waited
-// for, since a folder may hang; what it finds when nobody waits any more is dropped.
-void BrowserPage::StartListing() {
-  StopListing();
-  listing_ = true;
-  job_ = std::make_shared<Job>();
-  const auto tell = [this, weak = std::weak_ptr(job_)](FolderListing listing, bool complete) {
-    wxTheApp->CallAfter([this, weak, listing = std::move(listing), complete]() mutable {
-      if (weak.lock() != nullptr) TakeListing(std::move(listing), complete);
-    });
-  };
-  std::thread([tell, job = job_, folder = model_.Folder(), early = model_.ItemCount() == 0] {
-    FolderListing listing = ListForBrowser(folder, false, job->stop);
-    if (early && !job->stop) tell(listing, false);
-    AddFacts(folder, listing, job->stop);
-    if (!job->stop) tell(std::move(listing), true);
-  }).detach();
-}
+void BrowserPage::Reload() { reader_.List(model_.Folder(), model_.ItemCount() == 0); }
 
 void BrowserPage::TakeListing(FolderListing listing, bool complete) {
   const size_t count = listing.items.size();
   model_.SetItems(std::move(listing.items));
-  listing_ = !complete;
   LogEvent(complete ? "listed" : "names", std::to_string(count) + " " + model_.Folder());
   if (!wantedFocus_.empty()) {
     const size_t line = model_.FindLine(wantedFocus_);
     if (line != kNoLine) model_.Selected().SelectOnly(line);
   }
   if (model_.Selected().Focus() == kNoLine && model_.LineCount() > 0) model_.Selected().MoveFocus(0, false, true);
-  if (ShowsDetails()) {
-    details_->ModelChanged();
-  } else {
-    canvas_->ModelChanged();
+  ShowLines();
+  if (!ShowsDetails()) {
     if (wantedScroll_ >= 0) canvas_->ScrollTo(wantedScroll_);
     if (!wantedFocus_.empty()) canvas_->ShowLine(model_.Selected().Focus());
   }
   if (complete) {
-    Watch();
+    watch_.Watch(model_.Folder());
     StartFacts();
     OfferThumbnails();
     wantedFocus_.clear();
@@ -223,13 +147,13 @@ void BrowserPage::TakeListing(FolderListing listing, bool complete) {
   host_.BrowserChanged();
 }
 
-// Tells of changes in the folder; many at once are one. Only works once the program waits for events.
-void BrowserPage::Watch() {
-  if (settings.WatchFolders == 0 || watcher_ != nullptr) return;
-  const wxLogNull quiet;
-  watcher_ = std::make_unique<wxFileSystemWatcher>();
-  watcher_->SetOwner(this);
-  watcher_->Add(wxFileName::DirName(wxString::FromUTF8(model_.Folder())));
+void BrowserPage::OfferThumbnails() {
+  if (model_.ItemCount() == 0) return;
+  std::vector<std::string> files;
+  for (size_t i = 0; i < model_.ItemCount(); ++i) {
+    if (!model_.Item(i).folder) files.push_back(model_.Item(i).name);
+  }
+  offer_.Offer(model_.Folder(), std::move(files), model_.Modes());
 }
 
 // --- what only the files' headers tell ---
@@ -240,34 +164,17 @@ bool BrowserPage::NeedsFacts() const {
 }
 
 void BrowserPage::StartFacts() {
-  constexpr size_t kGathered = 200;
-  if (listing_ || factsJob_ != nullptr || !NeedsFacts()) return;
-  std::vector<std::pair<size_t, FolderItem>> wanted;
+  if (Listing() || reader_.ReadingFacts() || !NeedsFacts()) return;
+  PlacedItems wanted;
   for (size_t line = 0; line < model_.LineCount(); ++line) {
     const size_t item = model_.ItemOfLine(line);
     if (!model_.Item(item).folder && model_.Item(item).width == 0) wanted.emplace_back(item, model_.Item(item));
   }
-  if (wanted.empty()) return;
-  factsJob_ = std::make_shared<Job>();
-  const auto tell = [this, weak = std::weak_ptr(factsJob_)](std::vector<std::pair<size_t, FolderItem>> facts, bool last) {
-    wxTheApp->CallAfter([this, weak, facts = std::move(facts), last] {
-      if (weak.lock() != nullptr) TakeFacts(facts, last);
-    });
-  };
-  std::thread([tell, job = factsJob_, folder = model_.Folder(), wanted = std::move(wanted)]() mutable {
-    std::vector<std::pair<size_t, FolderItem>> found;
-    for (auto& [item, facts] : wanted) {
-      if (job->stop) return;
-      AddPictureFacts(folder, facts);
-      if (facts.width > 0) found.emplace_back(item, std::move(facts));
-      if (found.size() == kGathered) tell(std::exchange(found, {}), false);
-    }
-    tell(std::move(found), true);
-  }).detach();
+  if (!wanted.empty()) reader_.ReadFacts(model_.Folder(), std::move(wanted));
 }
 
-void BrowserPage::TakeFacts(const std::vector<std::pair<size_t, FolderItem>>& facts, bool last) {
-  for (const auto& [item, known] : facts) model_.SetFacts(item, known);
+void BrowserPage::TakeFacts(const PlacedItems& found, bool last) {
+  for (const auto& [item, known] : found) model_.SetFacts(item, known);
   const int32_t sort = model_.Modes().sort;
   if (last && (sort == choice::kSortExifDate || sort == choice::kSortDimensions)) {
     model_.UpdateOrder();
@@ -275,68 +182,7 @@ void BrowserPage::TakeFacts(const std::vector<std::pair<size_t, FolderItem>>& fa
   } else if (ShowsDetails()) {
     details_->Refresh();
   }
-  if (!last) return;
-  factsJob_.reset();
-  LogEvent("facts", model_.Folder());
-}
-
-// --- missing thumbnail files ---
-
-void BrowserPage::OfferThumbnails() {
-  if (offered_ || model_.ItemCount() == 0) return;
-  offered_ = true;
-  ThumbnailBrowser browser;
-  browser.folder = model_.Folder();
-  for (size_t i = 0; i < model_.ItemCount(); ++i) {
-    if (!model_.Item(i).folder) browser.files.push_back(model_.Item(i).name);
-  }
-  browser.mode = static_cast<choice::ThumbnailMode>(model_.Modes().thumbnails);
-  browser.view = static_cast<choice::ViewMode>(model_.Modes().view);
-  browser.asks = asksForUpdates_;
-  browser.lastCompaction = lastCompaction_;
-  // What the offer tells of a folder that was left meanwhile is dropped.
-  const auto weak = std::make_shared<std::weak_ptr<ThumbnailOffer>>();
-  const auto post = [this, weak](std::function<void()> action) {
-    wxTheApp->CallAfter([weak, action = std::move(action)] {
-      if (weak->lock() != nullptr) action();
-    });
-  };
-  ThumbnailOffer::Events events;
-  events.ask = [this, post](int32_t count, int32_t selected) {
-    post([this, count, selected] {
-      updateBar_->Ask(count, selected);
-      ShowUpdateBar(true);
-      LogEvent("offer", std::to_string(count));
-    });
-  };
-  events.building = [post, this](size_t done, size_t total) {
-    post([this, done, total] {
-      updateBar_->Tell(wxString::Format("Creating thumbnails: %zu of %zu", done, total));
-      ShowUpdateBar(done < total);
-    });
-  };
-  events.ended = [post, this](bool changed, const ThumbnailBrowser& after) {
-    post([this, changed, asks = after.asks, compaction = after.lastCompaction] {
-      asksForUpdates_ = asks;
-      lastCompaction_ = compaction;
-      ShowUpdateBar(false);
-      if (changed) canvas_->WantThumbnails();
-      LogEvent("offer-ended", changed ? "changed" : "unchanged");
-    });
-  };
-  offer_ = ThumbnailOffer::Start(std::move(browser), std::move(events));
-  *weak = offer_;
-}
-
-void BrowserPage::StopOffer() {
-  if (offer_ != nullptr) offer_->Stop();
-  offer_.reset();
-}
-
-void BrowserPage::ShowUpdateBar(bool show) {
-  if (updateBar_->IsShown() == show) return;
-  updateBar_->Show(show);
-  Layout();
+  if (last) LogEvent("facts", model_.Folder());
 }
 
 // --- what is shown how ---
@@ -356,14 +202,18 @@ void BrowserPage::ShowView() {
   }
   const bool hadFocus = canvas_->HasFocus() || (details_ != nullptr && details_->HasFocus());
   views_->SetSelection(details ? kDetailsView : kThumbnailView);
-  if (details) {
+  ShowLines();
+  if (!details) canvas_->ShowLine(model_.Selected().Focus());
+  if (hadFocus) FocusList();
+  StartFacts();
+}
+
+void BrowserPage::ShowLines() {
+  if (ShowsDetails()) {
     details_->ModelChanged();
   } else {
     canvas_->ModelChanged();
-    canvas_->ShowLine(model_.Selected().Focus());
   }
-  if (hadFocus) FocusList();
-  StartFacts();
 }
 
 void BrowserPage::SetModes(const BrowserModes& modes) {
@@ -420,21 +270,19 @@ void BrowserPage::EditFocusedName() {
   if (dialog.ShowModal() == wxID_OK) host_.RenameFile(model_.PathOfLine(focus), Utf8(dialog.GetValue()));
 }
 
-void BrowserPage::EditPath() {
-  path_->SetFocus();
-  path_->SelectAll();
-}
+void BrowserPage::EditPath() { path_->Edit(); }
 
 void BrowserPage::EditFilter() { filter_->SetFocus(); }
 
 void BrowserPage::ApplyFilter() {
   model_.SetFilter(Utf8(filter_->GetValue()));
-  if (ShowsDetails()) {
-    details_->ModelChanged();
-  } else {
-    canvas_->ModelChanged();
-  }
+  ShowLines();
   host_.BrowserChanged();
+}
+
+void BrowserPage::LeaveBar() {
+  if (!filter_->IsEmpty()) filter_->Clear();
+  FocusList();
 }
 
 void BrowserPage::Activated() {

@@ -1,30 +1,25 @@
 #pragma once
 
-#include <wx/fswatcher.h>
 #include <wx/panel.h>
-#include <wx/timer.h>
 
-#include <atomic>
-#include <functional>
-#include <memory>
 #include <string>
-#include <thread>
 #include <vector>
 
 #include "desktop/browser_model.h"
-#include "desktop/thumbnail_offer.h"
+#include "desktop/folder_trail.h"
+#include "desktop/windows/folder_reader.h"
+#include "desktop/windows/folder_watch.h"
 #include "desktop/windows/thumbnail_service.h"
+#include "desktop/windows/update_offer.h"
 
-class wxBitmapButton;
 class wxSearchCtrl;
 class wxSimplebook;
-class wxTextCtrl;
 
 namespace fotomill::desktop {
 
 class DetailsList;
+class PathBar;
 class ThumbnailCanvas;
-class UpdateBar;
 
 // What a browser asks of its frame.
 class BrowserHost {
@@ -41,16 +36,15 @@ class BrowserHost {
 class BrowserPage : public wxPanel {
  public:
   BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& thumbnails, const BrowserModes& modes);
-  ~BrowserPage() override;
 
-  // Goes to a folder; `focus` is the name that gets the focus once it is listed. Kept in the history unless `fromHistory`.
-  void Open(const std::string& folder, const std::string& focus = {}, bool fromHistory = false);
+  // Goes to a folder; `focus` is the name that gets the focus once it is listed.
+  void Open(const std::string& folder, const std::string& focus = {});
   void Reload();
-  void GoBack();
-  void GoForward();
+  // Goes back, or ahead, to folders that this browser showed.
+  void StepAlongTrail(int steps);
+  void GoBack() { StepAlongTrail(-1); }
+  void GoForward() { StepAlongTrail(1); }
   void GoUp();
-  bool CanGoBack() const { return historyPlace_ > 0; }
-  bool CanGoForward() const { return historyPlace_ + 1 < history_.size(); }
 
   const BrowserModel& Model() const { return model_; }
   BrowserModel& Model() { return model_; }
@@ -69,58 +63,43 @@ class BrowserPage : public wxPanel {
   // This browser comes to the front.
   void Activated();
   void FocusList();
-  bool Listing() const { return listing_; }
+  bool Listing() const { return reader_.Listing(); }
   size_t MissingThumbnails() const;
   int64_t Scroll() const;
   // Scrolled so far once the folder is listed.
   void RestoreScroll(int64_t scroll) { wantedScroll_ = scroll; }
 
  private:
-  void BuildPathBar();
-  void StartListing();
-  void StopListing();
+  void BuildFilter();
+  void BuildViews();
+  void ShowFolder(const std::string& folder, const std::string& focus);
   void TakeListing(FolderListing listing, bool complete);
+  void OfferThumbnails();
   void StartFacts();
-  void TakeFacts(const std::vector<std::pair<size_t, FolderItem>>& facts, bool last);
+  void TakeFacts(const PlacedItems& found, bool last);
   bool NeedsFacts() const;
   bool ShowsDetails() const;
   void ShowView();
+  void ShowLines();
   void SetModes(const BrowserModes& modes);
   void ThumbnailsCame(const std::vector<ThumbnailLoader::Result>& results);
   void Activate(size_t line);
   void BeginDrag();
-  void Watch();
   void ApplyFilter();
-  void OfferThumbnails();
-  void StopOffer();
-  void ShowUpdateBar(bool show);
+  void LeaveBar();
 
   BrowserHost& host_;
   ThumbnailService& thumbnails_;
   BrowserModel model_;
-  std::vector<std::string> history_;
-  size_t historyPlace_ = 0;
+  FolderTrail trail_;
   std::string wantedFocus_;
   int64_t wantedScroll_ = -1;
+  FolderReader reader_;
+  FolderWatch watch_;
+  UpdateOffer offer_;
 
-  bool listing_ = false;
-  struct Job {
-    std::atomic<bool> stop{false};
-  };
-  std::shared_ptr<Job> job_;       // of the latest listing
-  std::shared_ptr<Job> factsJob_;  // reads headers for columns and orders that need them
-  std::unique_ptr<wxFileSystemWatcher> watcher_;
-  wxTimer reloadTimer_;
-  std::shared_ptr<ThumbnailOffer> offer_;  // of this folder
-  bool offered_ = false;
-  bool asksForUpdates_ = true;  // until the user wants no more offers here
-  int64_t lastCompaction_ = 0;
-
-  wxBitmapButton* back_ = nullptr;
-  wxBitmapButton* forward_ = nullptr;
-  wxTextCtrl* path_ = nullptr;
+  PathBar* path_ = nullptr;
   wxSearchCtrl* filter_ = nullptr;
-  UpdateBar* updateBar_ = nullptr;
   wxSimplebook* views_ = nullptr;
   ThumbnailCanvas* canvas_ = nullptr;
   DetailsList* details_ = nullptr;
