@@ -45,17 +45,17 @@ bool BeginsWith(std::string_view name, std::string_view typed) {
 
 }  // namespace
 
-void BrowserModel::SetModes(const BrowserModes& modes) {
-  const bool sort = modes.sort != modes_.sort;
-  modes_ = modes;
+void BrowserModel::SetView(const FolderView& view) {
+  const bool sort = view.modes.sort != view_.modes.sort || view.descending != view_.descending;
+  view_ = view;
   if (sort) UpdateOrder();
 }
 
 void BrowserModel::SetSort(int32_t sortMode, bool descending) {
-  if (modes_.sort == sortMode && descending_ == descending) return;
-  modes_.sort = sortMode;
-  descending_ = descending;
-  UpdateOrder();
+  FolderView view = view_;
+  view.modes.sort = sortMode;
+  view.descending = descending;
+  SetView(view);
 }
 
 void BrowserModel::SetFolder(const std::string& folder) {
@@ -118,8 +118,8 @@ void BrowserModel::SetFilter(const std::string& filter) {
 void BrowserModel::SortItems() {
   order_.resize(items_.size());
   std::iota(order_.begin(), order_.end(), 0u);
-  const Comparison compare = ComparisonOf(modes_.sort);
-  const int sign = descending_ ? -1 : 1;
+  const Comparison compare = ComparisonOf(view_.modes.sort);
+  const int sign = view_.descending ? -1 : 1;
   std::sort(order_.begin(), order_.end(), [&](uint32_t left, uint32_t right) {
     const FolderItem& a = items_[left];
     const FolderItem& b = items_[right];

@@ -6,8 +6,8 @@
 #include <string_view>
 #include <vector>
 
-#include "core/folder_override.h"
 #include "desktop/folder_listing.h"
+#include "desktop/folder_views.h"
 #include "desktop/selection.h"
 
 namespace fotomill::desktop {
@@ -17,9 +17,10 @@ namespace fotomill::desktop {
 class BrowserModel {
  public:
   const std::string& Folder() const { return folder_; }
-  const BrowserModes& Modes() const { return modes_; }
-  void SetModes(const BrowserModes& modes);  // sorts anew where the sort mode changes
-  bool Descending() const { return descending_; }
+  const BrowserModes& Modes() const { return view_.modes; }
+  bool Descending() const { return view_.descending; }
+  const FolderView& View() const { return view_; }
+  void SetView(const FolderView& view);  // sorts anew where the order changes
   void SetSort(int32_t sortMode, bool descending);
 
   // Another folder, empty until its listing comes.
@@ -70,8 +71,7 @@ class BrowserModel {
   size_t ItemOrNone(size_t line) const { return line < lines_.size() ? lines_[line] : kNoLine; }
 
   std::string folder_;
-  BrowserModes modes_;
-  bool descending_ = false;
+  FolderView view_;
   std::string filter_;
   std::vector<FolderItem> items_;     // as listed
   std::vector<uint32_t> order_;       // all items in sorted order

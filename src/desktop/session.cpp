@@ -29,10 +29,10 @@ void TakeFrameValue(Session& session, std::string_view key, std::string_view val
 
 void TakeTabValue(SessionTab& tab, std::string_view key, std::string_view value) {
   if (key == "Folder") tab.folder = value;
-  if (key == "ThumbnailMode") tab.modes.thumbnails = Number(value);
-  if (key == "ViewMode") tab.modes.view = Number(value);
-  if (key == "SortMode") tab.modes.sort = Number(value);
-  if (key == "Descending") tab.descending = Number(value) != 0;
+  if (key == "ThumbnailMode") tab.view.modes.thumbnails = Number(value);
+  if (key == "ViewMode") tab.view.modes.view = Number(value);
+  if (key == "SortMode") tab.view.modes.sort = Number(value);
+  if (key == "Descending") tab.view.descending = Number(value) != 0;
   if (key == "Scroll") tab.scroll = std::max<int64_t>(LeadingInteger(value), 0);
   if (key == "Focus") tab.focus = value;
 }
@@ -71,9 +71,9 @@ std::string SessionText(const Session& session) {
                      Line("Maximized", session.maximized ? 1 : 0) + Line("Tab", static_cast<int64_t>(session.tab));
   for (const SessionTab& tab : session.tabs) {
     if (!FitsLine(tab.folder)) continue;
-    text += "[Tab]\n" + Line("Folder", tab.folder) + Line("ThumbnailMode", tab.modes.thumbnails) +
-            Line("ViewMode", tab.modes.view) + Line("SortMode", tab.modes.sort) + Line("Descending", tab.descending ? 1 : 0) +
-            Line("Scroll", tab.scroll);
+    text += "[Tab]\n" + Line("Folder", tab.folder) + Line("ThumbnailMode", tab.view.modes.thumbnails) +
+            Line("ViewMode", tab.view.modes.view) + Line("SortMode", tab.view.modes.sort) +
+            Line("Descending", tab.view.descending ? 1 : 0) + Line("Scroll", tab.scroll);
     if (FitsLine(tab.focus)) text += Line("Focus", tab.focus);
   }
   return text;

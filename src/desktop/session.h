@@ -5,7 +5,7 @@
 #include <string_view>
 #include <vector>
 
-#include "core/folder_override.h"
+#include "desktop/folder_views.h"
 
 namespace fotomill::desktop {
 
@@ -17,8 +17,7 @@ namespace fotomill::desktop {
 // a line "KEY=VALUE" each; lines that are not understood are passed over.
 struct SessionTab {
   std::string folder;
-  BrowserModes modes;
-  bool descending = false;
+  FolderView view;
   int64_t scroll = 0;
   std::string focus;
 

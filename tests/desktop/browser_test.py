@@ -54,6 +54,19 @@ def open_select_view(folder):
         desktop.key("Escape")
         desktop.wait(r"browser .*selected=1 ")
         desktop.focus("Fotomill Professional")
+        # Each folder keeps how it was asked to be shown, in the next run as well.
+        desktop.key("ctrl+5", "Home", "Return")
+        desktop.wait(r"listing=0 view=4 .*/sub$")
+        desktop.key("ctrl+1")
+        desktop.wait(r"view=0 .*/sub$")
+        desktop.key("alt+Up")
+        desktop.wait(r"listing=0 view=4 .*/pictures$")
+        desktop.key("ctrl+q")
+        desktop.wait_end()
+        desktop.arguments = [str(pictures / "sub")]
+        desktop.start()
+        desktop.wait(r"tabs=2 .*listing=0 view=0 .*/sub$")
+        desktop.focus("Fotomill Professional")
         desktop.key("ctrl+q")
         desktop.wait_end()
 

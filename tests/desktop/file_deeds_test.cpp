@@ -102,8 +102,22 @@ TEST(UndoList, KeepsSoMany) {
   EXPECT_FALSE(list.CanRedo());
 }
 
+TEST(FolderViews, AreKeptPerFolderTheLatestFirst) {
+  const FolderView otherwise{{2, 3, 0}}, large{{0, 4, 2}, true};
+  FolderViews views = FolderViews::Parse("1,5,0,/a,b\r\n9,0,0,/beyond\n1,5,0,\nnonsense\n");
+  EXPECT_EQ(views.Find("/a,b", otherwise), (FolderView{{2, 1, 5}}));
+  EXPECT_EQ(views.Find("/beyond", otherwise), otherwise);
+  views.Keep("/new\nline", large);
+  views.Keep("/c", large);
+  views.Keep("/a,b", large);
+  EXPECT_EQ(views.Text(), "4,2,1,/a,b\n4,2,1,/c\n");
+  for (int i = 0; i < 499; ++i) views.Keep("/many" + std::to_string(i), otherwise);
+  EXPECT_EQ(views.Find("/c", otherwise), otherwise);  // the oldest of 501
+  EXPECT_EQ(views.Find("/a,b", otherwise), (FolderView{{2, 4, 2}, true}));
+}
+
 TEST(Session, ComesBackAndForgivesOddLines) {
-  Session session{900, 600, true, 1, {{"/a=b [Tab]", {1, 4, 3}, true, 1234, "x.png"}, {"/c", {}, false, 0, ""}}};
+  Session session{900, 600, true, 1, {{"/a=b [Tab]", {{1, 4, 3}, true}, 1234, "x.png"}, {"/c", {}, 0, ""}}};
   EXPECT_EQ(ParseSession(SessionText(session)), session);
   session.tabs[1].folder = "/new\nline";
   EXPECT_EQ(ParseSession(SessionText(session)).tabs.size(), 1u);

@@ -28,15 +28,16 @@ enum View { kThumbnailView, kDetailsView };  // pages of the book, the second ma
 
 }  // namespace
 
-BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& thumbnails, const BrowserModes& modes)
+BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& thumbnails, const FolderView& view)
     : wxPanel(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTAB_TRAVERSAL | wxBORDER_NONE, "Browser"),
       host_(host),
       thumbnails_(thumbnails),
+      base_(view),
       reader_({[this](FolderListing listing, bool complete) { TakeListing(std::move(listing), complete); },
                [this](const PlacedItems& found, bool last) { TakeFacts(found, last); }}),
       watch_([this] { Reload(); }),
       offer_(this, {[this] { FocusList(); }, [this] { canvas_->WantThumbnails(); }}) {
-  model_.SetModes(modes);
+  model_.SetView(view);
   auto* bar = new wxBoxSizer(wxHORIZONTAL);
   path_ = new PathBar(this, {[this](int steps) { StepAlongTrail(steps); }, [this] { GoUp(); },
                              [this](const std::string& folder) {
@@ -112,13 +113,22 @@ void BrowserPage::ShowFolder(const std::string& folder, const std::string& focus
   watch_.Watch({});
   offer_.Forget();
   model_.SetFolder(folder);
-  model_.SetModes(ModesForFolder(folder, model_.Modes()));
+  TakeViewOf(folder);
   filter_->ChangeValue("");
   path_->ShowFolder(folder);
   canvas_->ScrollTo(0);
   ShowView();
   Reload();
   host_.BrowserChanged();
+}
+
+// How the folder was last asked to be shown, else as all folders are here; what the folder itself says wins, and goes on.
+void BrowserPage::TakeViewOf(const std::string& folder) {
+  const FolderView kept = host_.Views().Find(folder, base_);
+  FolderView view = kept;
+  view.modes = ModesForFolder(folder, kept.modes);
+  if (view != kept) base_ = view;
+  model_.SetView(view);
 }
 
 void BrowserPage::Reload() { reader_.List(model_.Folder(), model_.ItemCount() == 0); }
@@ -216,28 +226,36 @@ void BrowserPage::ShowLines() {
   }
 }
 
-void BrowserPage::SetModes(const BrowserModes& modes) {
-  model_.SetModes(modes);
+void BrowserPage::ShowAs(const FolderView& view) {
+  model_.SetView(view);
   ShowView();
   host_.BrowserChanged();
 }
 
-void BrowserPage::SetViewMode(int32_t view) {
-  BrowserModes modes = model_.Modes();
-  modes.view = view;
-  SetModes(modes);
+// What the user chooses is kept for this folder, and goes for folders of which nothing is kept.
+void BrowserPage::ChooseView(const FolderView& view) {
+  base_ = view;
+  host_.Views().Keep(model_.Folder(), view);
+  ShowAs(view);
 }
 
-void BrowserPage::SetThumbnailMode(int32_t mode) {
-  BrowserModes modes = model_.Modes();
-  modes.thumbnails = mode;
-  SetModes(modes);
+void BrowserPage::SetViewMode(int32_t mode) {
+  FolderView view = model_.View();
+  view.modes.view = mode;
+  ChooseView(view);
 }
 
 void BrowserPage::SetSort(int32_t sort, bool descending) {
-  model_.SetSort(sort, descending);
-  ShowView();
-  host_.BrowserChanged();
+  FolderView view = model_.View();
+  view.modes.sort = sort;
+  view.descending = descending;
+  ChooseView(view);
+}
+
+void BrowserPage::SetThumbnailMode(int32_t mode) {
+  FolderView view = model_.View();
+  view.modes.thumbnails = base_.modes.thumbnails = mode;
+  ShowAs(view);
 }
 
 void BrowserPage::ChangeSize(int steps) {

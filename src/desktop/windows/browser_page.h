@@ -26,6 +26,7 @@ class BrowserHost {
  public:
   virtual ~BrowserHost() = default;
   virtual void BrowserChanged() = 0;  // folder, selection, modes or counts
+  virtual FolderViews& Views() = 0;   // how folders are to be shown
   virtual void ViewFile(const std::string& path) = 0;
   virtual void ShowContextMenu(wxWindow& window, const wxPoint& place, bool onFile) = 0;
   virtual void RenameFile(const std::string& path, const std::string& name) = 0;
@@ -35,7 +36,7 @@ class BrowserHost {
 // One browser: the contents of a tab. Shows a folder as thumbnails, names or details.
 class BrowserPage : public wxPanel {
  public:
-  BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& thumbnails, const BrowserModes& modes);
+  BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& thumbnails, const FolderView& view);
 
   // Goes to a folder; `focus` is the name that gets the focus once it is listed.
   void Open(const std::string& folder, const std::string& focus = {});
@@ -48,7 +49,7 @@ class BrowserPage : public wxPanel {
 
   const BrowserModel& Model() const { return model_; }
   BrowserModel& Model() { return model_; }
-  void SetViewMode(int32_t view);
+  void SetViewMode(int32_t mode);
   void SetThumbnailMode(int32_t mode);
   void SetSort(int32_t sort, bool descending);
   // Next larger or smaller way of showing thumbnails.
@@ -81,7 +82,9 @@ class BrowserPage : public wxPanel {
   bool ShowsDetails() const;
   void ShowView();
   void ShowLines();
-  void SetModes(const BrowserModes& modes);
+  void TakeViewOf(const std::string& folder);
+  void ShowAs(const FolderView& view);
+  void ChooseView(const FolderView& view);
   void ThumbnailsCame(const std::vector<ThumbnailLoader::Result>& results);
   void Activate(size_t line);
   void BeginDrag();
@@ -91,6 +94,7 @@ class BrowserPage : public wxPanel {
   BrowserHost& host_;
   ThumbnailService& thumbnails_;
   BrowserModel model_;
+  FolderView base_;  // of folders of which nothing is kept
   FolderTrail trail_;
   std::string wantedFocus_;
   int64_t wantedScroll_ = -1;

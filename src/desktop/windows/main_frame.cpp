@@ -45,6 +45,7 @@ MainFrame::MainFrame()
     : wxFrame(nullptr, wxID_ANY, kTitle, wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE, "FotomillProfessional"),
       usesTimer_(this) {
   SetSize(FromDIP(wxSize(1180, 760)));
+  views_.Load();
   BuildMenus();
   BuildToolbar();
   BuildPanes();
@@ -194,9 +195,9 @@ BrowserPage* MainFrame::ShowFolder(const std::string& folder) {
 }
 
 BrowserPage* MainFrame::OpenTab(const std::string& folder) {
-  BrowserModes modes{settings.DefaultThumbnailMode, settings.DefaultViewMode, settings.DefaultSortMode};
-  if (const BrowserPage* browser = Browser()) modes = browser->Model().Modes();
-  auto* page = new BrowserPage(tabs_, *this, thumbnails_, modes);
+  FolderView view{{settings.DefaultThumbnailMode, settings.DefaultViewMode, settings.DefaultSortMode}};
+  if (const BrowserPage* browser = Browser()) view = browser->Model().View();
+  auto* page = new BrowserPage(tabs_, *this, thumbnails_, view);
   tabs_->AddPage(page, Shown(platform::FileNameOf(folder)), true);
   page->Open(folder);
   page->FocusList();
@@ -210,8 +211,7 @@ bool MainFrame::RestoreSession() {
   if (session.maximized) Maximize();
   if (settings.RememberOpenWindows == 0 || session.tabs.empty()) return false;
   for (const SessionTab& tab : session.tabs) {
-    auto* page = new BrowserPage(tabs_, *this, thumbnails_, tab.modes);
-    page->SetSort(tab.modes.sort, tab.descending);
+    auto* page = new BrowserPage(tabs_, *this, thumbnails_, tab.view);
     tabs_->AddPage(page, Shown(platform::FileNameOf(tab.folder)));
     page->Open(tab.folder, tab.focus);
     page->RestoreScroll(tab.scroll);
@@ -241,10 +241,11 @@ void MainFrame::KeepSession() {
   for (size_t tab = 0; tab < tabs_->GetPageCount() && settings.RememberOpenWindows != 0; ++tab) {
     const BrowserModel& model = PageAt(tab)->Model();
     const size_t focus = model.Selected().Focus();
-    session.tabs.push_back({model.Folder(), model.Modes(), model.Descending(), PageAt(tab)->Scroll(),
-                            focus == kNoLine ? std::string() : model.Line(focus).name});
+    session.tabs.push_back(
+        {model.Folder(), model.View(), PageAt(tab)->Scroll(), focus == kNoLine ? std::string() : model.Line(focus).name});
   }
   (void)SaveSession(session);
+  (void)views_.Save();
 }
 
 void MainFrame::CloseTab() {

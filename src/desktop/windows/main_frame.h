@@ -67,6 +67,7 @@ class MainFrame : public wxFrame, public BrowserHost {
 
   // BrowserHost
   void BrowserChanged() override;
+  FolderViews& Views() override { return views_; }
   void ViewFile(const std::string& path) override;
   void ShowContextMenu(wxWindow& window, const wxPoint& place, bool onFile) override;
   void RenameFile(const std::string& path, const std::string& name) override;
@@ -84,6 +85,7 @@ class MainFrame : public wxFrame, public BrowserHost {
   BrowserPage* PageAt(size_t tab) const;
 
   ThumbnailService thumbnails_;
+  FolderViews views_;
   wxSplitterWindow* splitter_ = nullptr;
   FolderTree* tree_ = nullptr;
   wxAuiNotebook* tabs_ = nullptr;
