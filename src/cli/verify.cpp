@@ -19,6 +19,14 @@ struct VerifyOptions {
   bool json = false;
 };
 
+// Decodes every frame of an animation.
+Status VerifyFrames(const std::string& name) {
+  AnimationPointer animation;
+  Status status = OpenAnimation(name.c_str(), animation);
+  while (status == Status::Ok) status = animation->Next();
+  return status == Status::NoImages ? Status::Ok : status;
+}
+
 // Decodes every page of a file.
 Status VerifyFile(const std::string& name, std::string& hint) {
   int32_t pages = 1;
@@ -32,6 +40,7 @@ Status VerifyFile(const std::string& name, std::string& hint) {
       hint = picture->warning.view();
       return Status::DamagedFile;
     }
+    if (pages > 1 && FormatRow(picture->formatIndex).animate != nullptr) return VerifyFrames(name);
   }
   return Status::Ok;
 }

@@ -36,173 +36,23 @@
 #include "core/byte_writer.h"
 #include "core/limits.h"
 #include "core/settings.h"
+#include "formats/gif_blocks.h"
+#include "formats/gif_frames.h"
 #include "formats/gif_lzw.h"
 #include "platform/file_view.h"
 
 namespace fotomill {
 
+using namespace gif;
+
 namespace {
-
-constexpr uint8_t kPictureBlock = 0x2C, kExtensionBlock = 0x21, kEndBlock = 0x3B;
-constexpr uint8_t kGraphicControl = 0xF9, kComment = 0xFE, kApplication = 0xFF;
-constexpr uint64_t kMostPixelsPerByte = 4096;  // more than LZW with 12-bit codes can ever reach
-constexpr int32_t kNoIndex = -1;
-
-enum Disposal : uint8_t { kKeep = 1, kToBackground = 2, kToPrevious = 3 };
-
-// A palette inside the file.
-struct GifPalette {
-  std::span<const uint8_t> colors;  // red, green, blue
-  int32_t bits = 0;                 // 2^bits entries; 0: there is none
-};
-
-struct GifScreen {
-  bool is89 = false;
-  int32_t width = 0, height = 0;
-  GifPalette palette;
-};
-
-struct GifFrame {
-  int32_t left = 0, top = 0, width = 0, height = 0;
-  bool interlaced = false;
-  GifPalette palette;  // local, else global
-  int32_t transparent = kNoIndex;
-  uint8_t disposal = 0;
-  uint16_t delay = 0;       // hundredths of a second
-  uint64_t dataOffset = 0;  // of the LZW data
-  uint8_t pixelBits = 0;    // as the LZW data say
-
-  // Bits per pixel of the picture that this frame is. Two-colour frames are coded with 2 bits.
-  int32_t Depth() const {
-    if (palette.bits == 0) return std::clamp<int32_t>(pixelBits, 1, 8);
-    return palette.bits == 1 && pixelBits <= 2 ? 1 : std::clamp<int32_t>(std::max<int32_t>(palette.bits, pixelBits), 1, 8);
-  }
-  bool Covers(const GifScreen& screen) const { return left == 0 && top == 0 && width >= screen.width && height >= screen.height; }
-};
-
-GifPalette TakePalette(ByteReader& bytes, uint8_t flags) {
-  if ((flags & 0x80) == 0) return {};
-  const int32_t bits = (flags & 7) + 1;
-  return {bytes.Take(uint64_t{3} << bits), bits};
-}
-
-// DamagedFile without the signature, FileReadError when the header is cut short.
-Status ParseScreen(ByteReader& bytes, GifScreen& screen) {
-  if (bytes.Match("GIF89a")) {
-    screen.is89 = true;
-  } else if (!bytes.Match("GIF87a")) {
-    return Status::DamagedFile;
-  }
-  screen.width = bytes.Le16();
-  screen.height = bytes.Le16();
-  const uint8_t flags = bytes.U8();
-  bytes.Skip(2);
-  screen.palette = TakePalette(bytes, flags);
-  return bytes.Ok() ? Status::Ok : Status::FileReadError;
-}
-
-void SkipSubBlocks(ByteReader& bytes) {
-  for (uint8_t size = bytes.U8(); size != 0; size = bytes.U8()) bytes.Skip(size);
-}
-
-// The text of an extension's sub-blocks.
-std::vector<uint8_t> TakeSubBlocks(ByteReader& bytes, uint64_t most) {
-  std::vector<uint8_t> text;
-  for (uint8_t size = bytes.U8(); size != 0; size = bytes.U8()) {
-    const auto piece = bytes.Take(size);
-    if (text.size() + piece.size() <= most) text.insert(text.end(), piece.begin(), piece.end());
-  }
-  return text;
-}
-
-void ParseGraphicControl(ByteReader& bytes, GifFrame& frame) {
-  const auto block = bytes.Take(bytes.U8());
-  if (block.size() >= 4) {
-    frame.disposal = block[0] >> 2 & 7;
-    frame.delay = static_cast<uint16_t>(block[1] | block[2] << 8);
-    frame.transparent = (block[0] & 1) != 0 ? block[3] : kNoIndex;
-  }
-  if (!block.empty()) SkipSubBlocks(bytes);
-}
-
-void ParseFrame(ByteReader& bytes, GifScreen& screen, GifFrame& frame) {
-  frame.left = bytes.Le16();
-  frame.top = bytes.Le16();
-  frame.width = bytes.Le16();
-  frame.height = bytes.Le16();
-  const uint8_t flags = bytes.U8();
-  frame.interlaced = (flags & 0x40) != 0;
-  frame.palette = TakePalette(bytes, flags);
-  if (frame.palette.bits == 0) frame.palette = screen.palette;
-  frame.dataOffset = bytes.Position();
-  frame.pixelBits = bytes.U8();
-  if (screen.width == 0) screen.width = frame.left + frame.width;  // a screen without size is as large as its picture
-  if (screen.height == 0) screen.height = frame.top + frame.height;
-}
-
-// What lies between the frames: comment and application blocks, as the caller wants them.
-struct GifRemarks {
-  std::vector<uint8_t> comment;
-  bool loops = false;
-};
-
-// Moves on to the next frame. NoImages when the file ends properly before one, FileReadError when it is cut short.
-Status NextFrame(ByteReader& bytes, GifScreen& screen, GifFrame& frame, GifRemarks* remarks = nullptr) {
-  frame = {};
-  while (bytes.Left() > 0) {
-    const uint8_t block = bytes.U8();
-    if (block == kEndBlock) return Status::NoImages;
-    if (block == kPictureBlock) {
-      ParseFrame(bytes, screen, frame);
-      return bytes.Ok() ? Status::Ok : Status::FileReadError;
-    }
-    if (block != kExtensionBlock) continue;
-    const uint8_t label = bytes.U8();
-    if (label == kGraphicControl) {
-      ParseGraphicControl(bytes, frame);
-    } else if (label == kComment && remarks != nullptr) {
-      const auto text = TakeSubBlocks(bytes, limits.exifTextBytes);
-      remarks->comment.insert(remarks->comment.end(), text.begin(), text.end());
-    } else if (label == kApplication && remarks != nullptr) {
-      const auto name = bytes.Take(bytes.U8());
-      remarks->loops = remarks->loops || (name.size() == 11 && std::memcmp(name.data(), "NETSCAPE2.0", 11) == 0);
-      if (!name.empty()) SkipSubBlocks(bytes);
-    } else {
-      SkipSubBlocks(bytes);
-    }
-  }
-  return Status::FileReadError;
-}
-
-void TakeColors(const GifFrame& frame, Palette& palette) {
-  if (frame.palette.bits == 0) {
-    palette = GreyRamp();
-    return;
-  }
-  palette.fill(0);
-  std::copy(frame.palette.colors.begin(), frame.palette.colors.end(), palette.begin());
-}
-
-// The file row that comes as number `r` of an interlaced picture.
-int32_t InterlacedRow(int32_t r, int32_t height) {
-  struct Pass {
-    int32_t first, step;
-  };
-  constexpr Pass kPasses[] = {{0, 8}, {4, 8}, {2, 4}, {1, 2}};
-  for (const Pass& pass : kPasses) {
-    const int32_t rows = height > pass.first ? (height - pass.first + pass.step - 1) / pass.step : 0;
-    if (r < rows) return pass.first + r * pass.step;
-    r -= rows;
-  }
-  return 0;
-}
 
 // Whether the screen and the frame leave a picture that can be shown with its own palette.
 bool KeepsPalette(const GifScreen& screen, const GifFrame& frame, int32_t page) {
   return page == 0 && frame.transparent == kNoIndex && frame.Covers(screen);
 }
 
-// Facts of the frame that `picture.page` selects, as far as its header tells. The reader stays behind the first frame's.
+// Facts of the frame that `picture.page` selects, as far as its head tells. The reader stays behind that of the first one.
 Status DescribePicture(ByteReader& bytes, GifScreen& screen, GifFrame& frame, PictureRecord& picture) {
   RETURN_IF_BAD(ParseScreen(bytes, screen));
   RETURN_IF_BAD(NextFrame(bytes, screen, frame));
@@ -219,20 +69,6 @@ Status DescribePicture(ByteReader& bytes, GifScreen& screen, GifFrame& frame, Pi
   } else {
     MakeDefaultPalette(&picture.palette, nullptr, kDisplayPalette);
   }
-  return Status::Ok;
-}
-
-// The indices of a frame in the order of the file. FileReadError before any memory is taken when the data cannot hold
-// so many.
-Status DecodeFrame(ByteReader& bytes, const GifFrame& frame, platform::MemoryBlock& pixels) {
-  const uint64_t count = static_cast<uint64_t>(frame.width) * static_cast<uint64_t>(frame.height);
-  if (count > limits.packedBlockBytes) return Status::MemoryAllocationError;
-  bytes.Seek(frame.dataOffset);
-  if (bytes.Left() < count / kMostPixelsPerByte) return Status::FileReadError;
-  if (!pixels.Allocate(count, platform::Fill::Unset)) return Status::MemoryAllocationError;
-  RETURN_IF_BAD(DecodeGifPixels(bytes, pixels.Bytes()));
-  bytes.Seek(frame.dataOffset + 1);
-  SkipSubBlocks(bytes);
   return Status::Ok;
 }
 
@@ -269,78 +105,14 @@ Status ReadIndexed(ByteReader& bytes, const GifFrame& frame, PictureRecord& pict
   return Status::Ok;
 }
 
-// The screen on which frames are drawn: colours and an alpha plane of the same size.
-struct Canvas {
-  PackedImage image, alpha;
-};
-
-// Calls `visit(y, x, count)` for every row of the frame that lies on the screen.
-template <typename Visit>
-void ForVisibleRows(const GifFrame& frame, const Canvas& canvas, Visit visit) {
-  const int32_t count = std::min(frame.width, canvas.image.Width() - frame.left);
-  for (int32_t r = 0; r < frame.height && count > 0; ++r) {
-    if (frame.top + r < canvas.image.Height()) visit(r, frame.top + r, count);
-  }
-}
-
-Status DrawFrame(ByteReader& bytes, const GifFrame& frame, Canvas& canvas) {
-  platform::MemoryBlock pixels;
-  RETURN_IF_BAD(DecodeFrame(bytes, frame, pixels));
-  Palette palette;
-  TakeColors(frame, palette);
-  std::vector<int32_t> order(static_cast<size_t>(frame.height));  // where row y of the frame stands in the data
-  for (int32_t r = 0; r < frame.height; ++r) {
-    order[static_cast<size_t>(frame.interlaced ? InterlacedRow(r, frame.height) : r)] = r;
-  }
-  ForVisibleRows(frame, canvas, [&](int32_t r, int32_t y, int32_t count) {
-    const auto row = static_cast<uint64_t>(order[static_cast<size_t>(r)]);
-    const uint8_t* source = pixels.Data() + row * static_cast<uint64_t>(frame.width);
-    uint8_t* place = canvas.image.Row(y).data() + 3 * frame.left;
-    uint8_t* opacity = canvas.alpha.Row(y).data() + frame.left;
-    for (int32_t x = 0; x < count; ++x, place += 3) {
-      if (source[x] == frame.transparent) continue;
-      const uint8_t* color = &palette[size_t{3} * source[x]];
-      place[0] = color[2];
-      place[1] = color[1];
-      place[2] = color[0];
-      opacity[x] = 255;
-    }
-  });
-  return Status::Ok;
-}
-
-// Clears the frame's place to transparent.
-void ClearFrame(const GifFrame& frame, Canvas& canvas) {
-  ForVisibleRows(frame, canvas, [&](int32_t, int32_t y, int32_t count) {
-    std::memset(canvas.image.Row(y).data() + 3 * frame.left, 0, 3 * static_cast<size_t>(count));
-    std::memset(canvas.alpha.Row(y).data() + frame.left, 0, static_cast<size_t>(count));
-  });
-}
-
-Status NewCanvas(int32_t width, int32_t height, Canvas& canvas) {
-  RETURN_IF_BAD(NewPackedImage(width, height, nullptr, 24, canvas.image));
-  return NewAlphaPlane(width, height, canvas.alpha);
-}
-
-Status CopyCanvas(const Canvas& from, Canvas& to) {
-  RETURN_IF_BAD(NewCanvas(from.image.Width(), from.image.Height(), to));
-  std::ranges::copy(from.image.Rows(), to.image.Rows().begin());
-  std::ranges::copy(from.alpha.Rows(), to.alpha.Rows().begin());
-  return Status::Ok;
-}
-
-// Draws the frames up to `picture.page`, each disposed of as it asks before the next one. NoImages when there are fewer.
-Status ReadComposed(ByteReader& bytes, GifScreen& screen, GifFrame frame, PictureRecord& picture, Canvas& canvas) {
-  RETURN_IF_BAD(NewCanvas(picture.width, picture.height, canvas));
+// Draws the frames up to `picture.page`. NoImages when there are fewer.
+Status ReadComposed(ByteReader& bytes, GifScreen& screen, GifFrame frame, const PictureRecord& picture, Canvas& canvas) {
+  GifDrawing drawing;
+  RETURN_IF_BAD(drawing.Begin(screen, canvas));
   for (int32_t page = 0;; ++page) {
-    Canvas before;
-    if (page < picture.page && frame.disposal == kToPrevious) RETURN_IF_BAD(CopyCanvas(canvas, before));
-    RETURN_IF_BAD(DrawFrame(bytes, frame, canvas));
+    RETURN_IF_BAD(drawing.Draw(bytes, frame, canvas));
     if (page == picture.page) return Status::Ok;
-    if (frame.disposal == kToBackground) ClearFrame(frame, canvas);
-    if (frame.disposal == kToPrevious) canvas = std::move(before);
     RETURN_IF_BAD(NextFrame(bytes, screen, frame));
-    if (frame.width < 1 || frame.height < 1) return Status::DamagedFile;
   }
 }
 
@@ -408,7 +180,9 @@ Status GifInfo(PictureRecord& picture, const char* fileName, uint32_t) {
   ByteReader bytes(file.Bytes());
   GifScreen screen;
   GifFrame frame;
-  return DescribePicture(bytes, screen, frame, picture);
+  RETURN_IF_BAD(DescribePicture(bytes, screen, frame, picture));
+  picture.pageCount = CountGifFrames(bytes, screen);
+  return Status::Ok;
 }
 
 Status GifRead(PictureRecord& picture, const char* fileName) {
@@ -462,7 +236,7 @@ Status GifDetails(PictureRecord& picture) {
   for (; NextFrame(bytes, screen, frame, &remarks) == Status::Ok; ++frames) {
     if (frames == 0) first = frame;
     duration += frame.delay;
-    SkipSubBlocks(bytes);
+    SkipFrame(bytes);
     file.DropBefore(bytes.Position());
   }
   picture.pageCount = std::max(frames, 1);

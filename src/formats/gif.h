@@ -1,5 +1,6 @@
 #pragma once
 
+#include "picture/animation.h"
 #include "picture/picture_record.h"
 #include "picture/write_options.h"
 
@@ -14,5 +15,6 @@ Status GifRead(PictureRecord& picture, const char* fileName);
 // ErrorWritingFile (11).
 Status GifWrite(PictureRecord& picture, const WriteOptions& options);
 Status GifDetails(PictureRecord& picture);
+Status GifAnimate(const char* fileName, AnimationPointer& animation);
 
 }  // namespace fotomill

@@ -43,6 +43,7 @@ constexpr std::string_view kExifHead("Exif\0\0", 6);  // some programs put it in
 struct WebpFrame {
   int32_t left = 0, top = 0;  // on the canvas
   int32_t width = 0, height = 0;
+  int32_t duration = 0;  // milliseconds
   uint8_t flags = 0;
   std::span<const uint8_t> pixels;  // what the library decodes: the whole file, or the frame's chunks
 };
@@ -51,6 +52,7 @@ struct WebpFile {
   int32_t width = 0, height = 0;  // of the canvas
   bool alpha = false;
   int format = 0;                 // of the library, 0 for an animation
+  uint16_t loops = 0;             // of an animation: how often it is played, 0 for ever
   std::vector<WebpFrame> frames;  // one of a still picture
   std::span<const uint8_t> icc, exif, xmp;
 };
@@ -77,7 +79,8 @@ void TakeFrame(std::span<const uint8_t> chunk, WebpFile& file) {
   WebpFrame frame;
   frame.left = static_cast<int32_t>(2 * Le24(bytes));
   frame.top = static_cast<int32_t>(2 * Le24(bytes));
-  bytes.Skip(kFrameHead - 7);
+  bytes.Skip(6);
+  frame.duration = static_cast<int32_t>(Le24(bytes));
   frame.flags = bytes.U8();
   frame.pixels = bytes.Take(bytes.Left());
   if (file.frames.size() < kMostFrames) file.frames.push_back(frame);
@@ -92,6 +95,7 @@ void WalkChunks(std::span<const uint8_t> data, WebpFile& file) {
     const uint64_t length = bytes.Le32();
     const auto chunk = bytes.Take(std::min<uint64_t>(length, bytes.Left()));
     const auto is = [&](const char* wanted) { return std::memcmp(name.data(), wanted, 4) == 0; };
+    if (is("ANIM") && chunk.size() >= 6) file.loops = static_cast<uint16_t>(chunk[4] | chunk[5] << 8);
     if (is("ANMF")) TakeFrame(chunk, file);
     if (is("ICCP")) file.icc = chunk;
     if (is("EXIF")) file.exif = chunk;
@@ -157,10 +161,6 @@ void Describe(const WebpFile& file, PictureRecord& picture) {
   Assign(picture.metadata.icc, file.icc);
 }
 
-struct WebpTarget {
-  PackedImage image, alpha;
-};
-
 // Puts a row of a frame onto the canvas: in the place of what is there, or over it.
 void PutRow(const uint8_t* source, int32_t width, bool replace, uint8_t* color, uint8_t* alpha) {
   for (int32_t x = 0; x < width; ++x, source += 4, color += 3, ++alpha) {
@@ -177,7 +177,7 @@ void PutRow(const uint8_t* source, int32_t width, bool replace, uint8_t* color, 
   }
 }
 
-void ClearFrame(const WebpFrame& frame, WebpTarget& target) {
+void ClearFrame(const WebpFrame& frame, Canvas& target) {
   for (int32_t y = frame.top; y < frame.top + frame.height; ++y) {
     std::fill_n(target.image.Row(y).data() + 3 * static_cast<size_t>(frame.left), 3 * static_cast<size_t>(frame.width),
                 uint8_t{0});
@@ -186,7 +186,7 @@ void ClearFrame(const WebpFrame& frame, WebpTarget& target) {
 }
 
 // With alpha, a frame is decoded to four bytes a pixel and put in its place.
-Status ReadFrame(const WebpFrame& frame, const PictureRecord& picture, WebpTarget& target) {
+Status ReadFrame(const WebpFrame& frame, Canvas& target) {
   const size_t stride = 4 * static_cast<size_t>(frame.width);
   platform::MemoryBlock decoded;
   if (!decoded.Allocate(stride * static_cast<size_t>(frame.height), platform::Fill::Unset)) return Status::MemoryAllocationError;
@@ -200,24 +200,30 @@ Status ReadFrame(const WebpFrame& frame, const PictureRecord& picture, WebpTarge
     PutRow(decoded.Data() + stride * static_cast<size_t>(y), frame.width, (frame.flags & kReplace) != 0,
            target.image.Row(frame.top + y).data() + 3 * static_cast<size_t>(frame.left),
            target.alpha.Row(frame.top + y).data() + frame.left);
-    picture.ReportRow(frame.top + y);
   }
   return Status::Ok;
 }
 
+// Puts a frame on the canvas that the frames before it have left.
+Status DrawFrame(WebpFile& file, size_t index, Canvas& target) {
+  WebpFrame& frame = file.frames[index];
+  if (frame.width == 0) RETURN_IF_BAD(MeasureFrame(file, frame));
+  if (index > 0 && (file.frames[index - 1].flags & kClearAfterwards) != 0) ClearFrame(file.frames[index - 1], target);
+  return ReadFrame(frame, target);
+}
+
 // The canvas as it is with frame `page` on it.
-Status ReadWithAlpha(WebpFile& file, const PictureRecord& picture, WebpTarget& target) {
-  for (size_t i = 0; i <= static_cast<size_t>(picture.page); ++i) {
-    WebpFrame& frame = file.frames[i];
-    if (frame.width == 0) RETURN_IF_BAD(MeasureFrame(file, frame));
-    if (i > 0 && (file.frames[i - 1].flags & kClearAfterwards) != 0) ClearFrame(file.frames[i - 1], target);
-    RETURN_IF_BAD(ReadFrame(frame, picture, target));
+Status ReadWithAlpha(WebpFile& file, const PictureRecord& picture, Canvas& target) {
+  const int32_t frames = picture.page + 1;
+  for (int32_t i = 0; i < frames; ++i) {
+    RETURN_IF_BAD(DrawFrame(file, static_cast<size_t>(i), target));
+    picture.ReportRow(i, frames);
   }
   return Status::Ok;
 }
 
 // An animation that does not tell of alpha may have it all the same; mostly it has not.
-void DropOpaqueAlpha(WebpTarget& target) {
+void DropOpaqueAlpha(Canvas& target) {
   for (int32_t y = 0; y < target.alpha.Height(); ++y) {
     const uint8_t* row = target.alpha.Row(y).data();
     if (std::any_of(row, row + target.alpha.Width(), [](uint8_t alpha) { return alpha != 255; })) return;
@@ -226,7 +232,7 @@ void DropOpaqueAlpha(WebpTarget& target) {
 }
 
 // Without alpha the library fills the picture's own rows, which are stored bottom row first.
-Status ReadOpaque(const WebpFile& file, const PictureRecord& picture, WebpTarget& target) {
+Status ReadOpaque(const WebpFile& file, const PictureRecord& picture, Canvas& target) {
   WebPDecoderConfig config;
   if (WebPInitDecoderConfig(&config) == 0) return Status::MemoryAllocationError;
   config.output.colorspace = MODE_BGR;
@@ -237,6 +243,27 @@ Status ReadOpaque(const WebpFile& file, const PictureRecord& picture, WebpTarget
   for (int32_t y = 0; y < file.height; ++y) picture.ReportRow(y);
   return Status::Ok;
 }
+
+class WebpAnimation final : public Animation {
+ public:
+  Status Open(const char* fileName) {
+    if (!view_.Open(fileName)) return Status::FileOpenError;
+    RETURN_IF_BAD(ParseFile(view_.Bytes(), file_));
+    for (const WebpFrame& frame : file_.frames) delays_.push_back(frame.duration);
+    rounds_ = file_.loops;
+    return CheckPackedSize(file_.width, file_.height, 24);
+  }
+
+ private:
+  Status Compose(size_t frame) override {
+    if (frame == 0) RETURN_IF_BAD(NewCanvas(file_.width, file_.height, canvas_));
+    RETURN_IF_BAD(DrawFrame(file_, frame, canvas_));
+    return view_.Intact() ? Status::Ok : Status::FileReadError;
+  }
+
+  platform::FileView view_;
+  WebpFile file_;  // views into the file
+};
 
 struct PictureDeleter {
   void operator()(WebPPicture* picture) const { WebPPictureFree(picture); }
@@ -346,7 +373,7 @@ Status WebpRead(PictureRecord& picture, const char* fileName) {
   Describe(file, picture);
   if (picture.page < 0 || picture.page >= picture.pageCount) return Status::NoImages;
   const bool canvas = file.alpha || file.frames.size() > 1;
-  WebpTarget target;
+  Canvas target;
   RETURN_IF_BAD(NewPackedImage(file.width, file.height, &picture.palette, 24, target.image));
   if (canvas) RETURN_IF_BAD(NewAlphaPlane(file.width, file.height, target.alpha));
   RETURN_IF_BAD(canvas ? ReadWithAlpha(file, picture, target) : ReadOpaque(file, picture, target));
@@ -354,6 +381,13 @@ Status WebpRead(PictureRecord& picture, const char* fileName) {
   if (canvas && !file.alpha) DropOpaqueAlpha(target);
   picture.image = std::move(target.image);
   picture.alpha = std::move(target.alpha);
+  return Status::Ok;
+}
+
+Status WebpAnimate(const char* fileName, AnimationPointer& animation) {
+  auto opened = std::make_unique<WebpAnimation>();
+  RETURN_IF_BAD(opened->Open(fileName));
+  animation = std::move(opened);
   return Status::Ok;
 }
 

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "picture/animation.h"
 #include "picture/picture_record.h"
 #include "picture/write_options.h"
 
@@ -10,6 +11,7 @@ namespace fotomill {
 // pages.
 Status WebpInfo(PictureRecord& picture, const char* fileName, uint32_t flags);
 Status WebpRead(PictureRecord& picture, const char* fileName);
+Status WebpAnimate(const char* fileName, AnimationPointer& animation);
 // Also UnsuitableImage (13) for sides over 16383, ErrorCreatingFile (10), ErrorWritingFile (11).
 Status WebpWrite(PictureRecord& picture, const WriteOptions& options);
 

@@ -36,6 +36,14 @@ Status ReadPicture(PictureRecord& picture) {
   return row.read(picture, fileName.c_str());
 }
 
+Status OpenAnimation(const char* fileName, AnimationPointer& animation) {
+  animation.reset();
+  const int32_t index = FindFormatByName(fileName);
+  if (index == kNoFormat) return Status::UnsupportedFormat;
+  const AnimateOperation animate = FormatRow(index).animate;
+  return animate == nullptr ? Status::UnsupportedFunction : animate(fileName, animation);
+}
+
 Status WritePicture(PictureRecord& picture, std::string_view destination, const WriteOptions& options) {
   return WritePictureAs(picture, destination, FindFormatByName(destination), options);
 }

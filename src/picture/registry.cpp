@@ -53,6 +53,7 @@ struct BuiltInRow {
   InfoOperation info;
   ReadOperation read;
   WriteOperation write;
+  AnimateOperation animate = nullptr;
   LifeOperation startup = nullptr;
   LifeOperation shutdown = nullptr;
 };
@@ -79,7 +80,7 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"FIT", "(FIT) Flexible Image Transport", 1, 24, FMT_BITMAP,
      FitsDetails, FitsInfo, FitsRead, FitsWrite},
     {"GIF", "(GIF) CompuServe", 1, 8, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_PAGES | FMT_TIMED | FMT_FRAMES | FMT_LAYERED | FMT_TRANSPARENT,
-     GifDetails, GifInfo, GifRead, GifWrite},
+     GifDetails, GifInfo, GifRead, GifWrite, GifAnimate},
     {"HDP", "(HDP) HD Photo", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_FRAMES | FMT_LAYERED,
      HdpDetails, HdpInfo, HdpRead, HdpWrite},
     {"HRZ", "(HRZ) SSTV", 1, 24, FMT_BITMAP,
@@ -133,7 +134,7 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"WBMP", "(WBMP) WAP bitmap", 1, 1, FMT_BITMAP,
      nullptr, NoInfo, NoRead, NoWrite},
     {"WEBP", "(WEBP) Google WebP", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES | FMT_LAYERED | FMT_TRANSPARENT | FMT_ALPHA,
-     nullptr, WebpInfo, WebpRead, WebpWrite},
+     nullptr, WebpInfo, WebpRead, WebpWrite, WebpAnimate},
     {"WPG", "(WPG) WordPerfect Graphics", 1, 8, FMT_BITMAP,
      nullptr, NoInfo, NoRead, NoWrite},
     {"XBM", "(XBM) XWindows bitmap", 1, 1, FMT_BITMAP,
@@ -211,9 +212,9 @@ constexpr BuiltInRow kBuiltInRows[] = {
     {"WMV", "(WMV) WMV video", 1, 24, FMT_BITMAP | FMT_ANIMATED | FMT_TIMED | FMT_SECONDARY | FMT_MEDIA,
      nullptr, NoInfo, NoRead, NoWrite},
     {"RAR", "(RAR) RAR archive", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_CONTAINER | FMT_LAYERED | FMT_SECONDARY | FMT_ARCHIVE,
-     nullptr, NoInfo, NoRead, NeverWritten, NoStartup, NoStartup},
+     nullptr, NoInfo, NoRead, NeverWritten, nullptr, NoStartup, NoStartup},
     {"ZIP", "(ZIP) ZIP archive", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_CONTAINER | FMT_LAYERED | FMT_SECONDARY | FMT_ARCHIVE,
-     nullptr, NoInfo, NoRead, NoWrite, Ready, Ready},
+     nullptr, NoInfo, NoRead, NoWrite, nullptr, Ready, Ready},
     {"", "", 0, 0, FMT_SPARE,
      nullptr, nullptr, nullptr, nullptr},
 };
@@ -229,6 +230,7 @@ constexpr std::array<FormatEntry, formatCount> MakeRows() {
                .info = facts.info,
                .read = facts.read,
                .write = facts.write,
+               .animate = facts.animate,
                .startup = facts.startup,
                .shutdown = facts.shutdown,
                .maxBits = facts.maxBits,

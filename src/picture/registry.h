@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "core/status.h"
+#include "picture/animation.h"
 #include "picture/picture_record.h"
 #include "picture/write_options.h"
 
@@ -43,6 +44,7 @@ using DetailsOperation = Status (*)(PictureRecord& picture);  // fills `detailLi
 using InfoOperation = Status (*)(PictureRecord& picture, const char* fileName, uint32_t flags);
 using ReadOperation = Status (*)(PictureRecord& picture, const char* fileName);
 using WriteOperation = Status (*)(PictureRecord& picture, const WriteOptions& options);  // to picture.fileName
+using AnimateOperation = Status (*)(const char* fileName, AnimationPointer& animation);  // opens a file's frames
 using LifeOperation = int32_t (*)();
 using OptionsOperation = int32_t (*)(void* parentWindow, int32_t parameter);
 
@@ -52,6 +54,7 @@ struct FormatEntry {
   InfoOperation info = nullptr;
   ReadOperation read = nullptr;
   WriteOperation write = nullptr;
+  AnimateOperation animate = nullptr;
   LifeOperation startup = nullptr;
   LifeOperation shutdown = nullptr;
   uint32_t reserved = 0;
@@ -125,6 +128,10 @@ Status LoadPictureInfo(const char* fileName, PicturePointer& picture, uint32_t f
 // The second half: decodes the page `picture.page` of the file that the record has the facts of. NoImages (20) when the
 // file has no such page, else the codec's own status; `image` and `alpha` are empty unless Ok.
 Status ReadPicture(PictureRecord& picture);
+
+// Opens the frames of a file, to be gone through in order; a still picture of such a format has one. UnsupportedFunction (5)
+// for formats without, else the codec's own status; `animation` is null unless Ok.
+Status OpenAnimation(const char* fileName, AnimationPointer& animation);
 
 // Writes a picture to `destination` in the format of its extension. UnsupportedFormat (8) when no row matches,
 // TooManyColors (12) when the picture is deeper than the row takes, UnsupportedFunction (5) when the row cannot write,
