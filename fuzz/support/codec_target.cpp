@@ -44,6 +44,10 @@ void TryCodec(const char* extension, const uint8_t* data, size_t size) {
   described->fileName.AssignCut(path);
   const Status info = row.info(*described, path.c_str(), 0);
   if (row.details != nullptr) (void)row.details(*described);
+  AnimationPointer animation;
+  if (row.animate != nullptr && row.animate(path.c_str(), animation) == Status::Ok) {
+    while (animation->Next() == Status::Ok) continue;
+  }
   const Status read = row.read(*picture, path.c_str());
   if (read != Status::Ok) {
     if (!picture->image.Empty() || !picture->alpha.Empty()) std::abort();

@@ -27,6 +27,14 @@ std::string Resolution(double pixelsPerInch) {
   return text;
 }
 
+// How long each frame is to be shown, and how often all of them are, 0 for ever.
+void AddFrames(const PictureRecord& picture, Json& facts) {
+  AnimationPointer animation;
+  if (picture.pageCount < 2 || OpenAnimation(picture.fileName.c_str(), animation) != Status::Ok) return;
+  facts["delaysMs"] = animation->Delays();
+  facts["rounds"] = animation->Rounds();
+}
+
 Json FactsAsJson(const PictureRecord& picture) {
   const FormatEntry& row = FormatRow(picture.formatIndex);
   Json facts;
@@ -43,6 +51,7 @@ Json FactsAsJson(const PictureRecord& picture) {
   facts["details"] = Json::array();
   for (size_t i = 0; i < picture.detailLines.Count(); ++i) facts["details"].push_back(picture.detailLines.Line(i));
   facts["pages"] = picture.pageCount;
+  AddFrames(picture, facts);
   if (picture.metadata.dpiX > 0) facts["dpiX"] = picture.metadata.dpiX;
   if (picture.metadata.dpiY > 0) facts["dpiY"] = picture.metadata.dpiY;
   return facts;

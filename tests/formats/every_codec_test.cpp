@@ -239,6 +239,11 @@ void ExpectClean(const FormatEntry& row, const std::string& path) {
   if (status != Status::Ok) {
     EXPECT_TRUE(picture->alpha.Empty());
   }
+  AnimationPointer animation;
+  if (row.animate == nullptr || row.animate(path.c_str(), animation) != Status::Ok) return;
+  size_t frames = 0;
+  while (animation->Next() == Status::Ok) ++frames;
+  EXPECT_LE(frames, animation->Delays().size());
 }
 
 TEST(EveryCodec, EndsCleanlyOnFilesCutShort) {

@@ -1,0 +1,90 @@
+#!/usr/bin/python3
+"""Animations that Pillow writes have the delays, rounds and composed frames that Pillow reads from them."""
+import json
+import os
+import random
+import subprocess
+import sys
+import tempfile
+from pathlib import Path
+
+try:
+    from PIL import Image, ImageDraw, features
+except ImportError:
+    sys.exit(77)
+
+FOTOMILL = os.environ["FOTOMILL"]
+DELAYS = [0, 20, 70, 650, 100, 30]
+
+
+def frames(seed, alpha):
+    """Pictures that differ in places, some of them transparent."""
+    draw_random = random.Random(seed)
+    for _ in DELAYS:
+        picture = Image.new("RGBA", (61, 37), (0, 0, 0, 0) if alpha else (250, 240, 10, 255))
+        draw = ImageDraw.Draw(picture)
+        for _ in range(3):
+            x, y = draw_random.randrange(55), draw_random.randrange(30)
+            draw.rectangle((x, y, x + draw_random.randrange(25), y + draw_random.randrange(20)),
+                           fill=tuple(draw_random.randrange(256) for _ in range(3)) + (255,))
+        yield picture
+
+
+def told(path):
+    return json.loads(subprocess.run([FOTOMILL, "info", "--json", "-q", path], stdout=subprocess.PIPE, check=True).stdout)[0]
+
+
+def page(path, number, folder):
+    subprocess.run([FOTOMILL, "convert", "-t", "png", "--page", str(number), "-d", str(folder), "--overwrite", "replace", "-q", str(path)],
+                   stdout=subprocess.DEVNULL, check=True)
+    return Image.open(folder / (path.stem + ".png")).convert("RGBA")
+
+
+def visible(picture):
+    """Pixels, with one value for all that are wholly transparent."""
+    return [pixel if pixel[3] else (0, 0, 0, 0) for pixel in picture.getdata()]
+
+
+def check(path, rounds, folder):
+    facts = told(path)
+    judge = Image.open(path)
+    assert facts["pages"] == judge.n_frames == len(facts["delaysMs"]), (path, facts, judge.n_frames)
+    assert facts["rounds"] == rounds, (path, facts["rounds"])
+    for number, delay in enumerate(facts["delaysMs"]):
+        judge.seek(number)
+        judge.load()
+        assert delay == judge.info.get("duration", 0), (path, number, delay, judge.info.get("duration", 0))
+        assert visible(page(path, number + 1, folder)) == visible(judge.convert("RGBA")), (path, number)
+
+
+def cut_in_a_frame(path, folder):
+    """A file that ends within a later frame is damaged, though its first one can be shown."""
+    broken = folder / ("cut" + path.suffix)
+    broken.write_bytes(path.read_bytes()[:-60])
+    page(broken, 1, folder / "pages")
+    assert subprocess.run([FOTOMILL, "verify", broken], stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL).returncode != 0
+
+
+def main():
+    with tempfile.TemporaryDirectory() as name:
+        folder = Path(name)
+        (folder / "pages").mkdir()
+        # loop as the file has it: none at all, for ever, a number of repetitions
+        for disposal, alpha, loop, rounds in ((0, False, None, 1), (1, True, 0, 0), (2, True, 1, 2), (3, True, 9, 10)):
+            path = folder / f"disposal{disposal}.gif"
+            first, *rest = frames(disposal, alpha)
+            first.save(path, save_all=True, append_images=rest, duration=DELAYS, disposal=[0] + [disposal] * len(rest),
+                       **({} if loop is None else {"loop": loop}))
+            check(path, rounds, folder / "pages")
+        cut_in_a_frame(path, folder)
+        if features.check("webp_anim"):
+            for alpha, loop in ((False, 0), (True, 3)):
+                path = folder / f"alpha{alpha}.webp"
+                first, *rest = frames(7, alpha)
+                first.save(path, save_all=True, append_images=rest, duration=DELAYS, loop=loop, lossless=True)
+                check(path, loop, folder / "pages")
+            cut_in_a_frame(path, folder)
+
+
+if __name__ == "__main__":
+    main()
