@@ -237,6 +237,14 @@ std::string BrowserModel::CountText() const {
   return text;
 }
 
+std::string BrowserModel::FocusText() const {
+  const size_t focus = selection_.Focus();
+  if (focus >= LineCount()) return {};
+  std::string text = Line(focus).name + (Line(focus).folder ? ", folder, " : ", ");
+  text += WithThousands(focus + 1) + " of " + WithThousands(LineCount());
+  return text + (selection_.IsSelected(focus) ? ", selected" : "");
+}
+
 std::string SizeText(uint64_t bytes, int32_t mode) {
   constexpr const char* kUnits[] = {"KB", "MB", "GB", "TB", "PB", "EB"};
   if (mode == choice::kSizeBytes) return WithThousands(bytes) + (bytes == 1 ? " byte" : " bytes");

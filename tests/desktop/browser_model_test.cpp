@@ -116,6 +116,7 @@ TEST(BrowserModel, TypingFinds) {
   EXPECT_EQ(model.FindTyped("ad", false), 2u);
   EXPECT_EQ(model.FindTyped("x", true), kNoLine);
   EXPECT_EQ(model.CountText(), "4 files, 600 bytes");
+  EXPECT_EQ(model.FocusText(), "ab.png, 1 of 4");
 }
 
 TEST(Selection, MouseAndKeyboard) {

@@ -4,6 +4,7 @@
 #include "core/configuration.h"
 #include "core/data_folder.h"
 #include "desktop/event_log.h"
+#include "desktop/windows/control_names.h"
 #include "desktop/windows/main_frame.h"
 #include "desktop/windows/override_box.h"
 #include "desktop/windows/wx_text.h"
@@ -54,6 +55,7 @@ class App : public wxApp {
     SetDataFolder({});
     (void)LoadConfiguration();
     TakeFormatSwitches();
+    NameControlsAsTheyCome();
     InstallOverrideBoxes();
     RunFormatStartup();
     EnablePlugins();

@@ -80,6 +80,7 @@ class FinderBox : public wxDialog {
     const int step = event.GetKeyCode() == WXK_DOWN ? 1 : event.GetKeyCode() == WXK_UP ? -1 : 0;
     const bool enter = event.GetKeyCode() == WXK_RETURN || event.GetKeyCode() == WXK_NUMPAD_ENTER;
     if (enter) return EndModal(wxID_OK);
+    if (event.GetKeyCode() == WXK_ESCAPE) return EndModal(wxID_CANCEL);
     const int line = list_->GetSelection() + step;
     if (step == 0 || list_->HasFocus()) return event.Skip();
     if (line >= 0 && line < static_cast<int>(found_.size())) list_->SetSelection(line);

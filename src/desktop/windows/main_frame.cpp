@@ -268,6 +268,9 @@ void MainFrame::StepTab(int step) {
 }
 
 void MainFrame::OnTabChanged(wxAuiNotebookEvent& event) {
+  for (wxWindow* const window : tabs_->GetChildren()) {
+    if (wxDynamicCast(window, wxAuiTabCtrl) != nullptr) window->SetName("Tabs");
+  }
   if (BrowserPage* browser = Browser()) {
     browser->Activated();
     CallAfter([this] {

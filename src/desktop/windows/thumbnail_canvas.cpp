@@ -14,6 +14,7 @@
 #include "core/text.h"
 #include "desktop/event_log.h"
 #include "desktop/windows/bitmaps.h"
+#include "desktop/windows/screen_reader.h"
 #include "desktop/windows/wx_text.h"
 #include "picture/registry.h"
 #include "platform/clock.h"
@@ -109,6 +110,7 @@ void ThumbnailCanvas::ModelChanged() {
   scroll_ = std::clamp<int64_t>(scroll_, 0, layout_.LargestScroll());
   UpdateScrollbar();
   WantThumbnails();
+  TellFocus();
   Refresh();
 }
 
@@ -387,8 +389,16 @@ void ThumbnailCanvas::OnWheel(wxMouseEvent& event) {
 
 size_t ThumbnailCanvas::LineAt(const wxPoint& point) const { return layout_.LineAt(point.x, point.y + scroll_); }
 
+// Screen readers know the canvas by the file with the focus, and say it again when that changes.
+void ThumbnailCanvas::TellFocus() {
+  const wxString focus = Shown(model_.FocusText());
+  const wxString count = Shown(std::to_string(model_.Selected().SelectedCount()) + " selected");
+  TellScreenReader(*this, focus.empty() ? wxString("Thumbnails") : focus, "Thumbnails, " + count);
+}
+
 void ThumbnailCanvas::TellSelection() {
   Refresh();
+  TellFocus();
   if (events_.selectionChanged) events_.selectionChanged();
 }
 

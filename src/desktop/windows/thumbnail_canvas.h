@@ -70,6 +70,7 @@ class ThumbnailCanvas : public wxWindow {
   ThumbnailWish WishOf(size_t line) const;
   size_t LineAt(const wxPoint& point) const;
   void MoveFocus(Step step, const wxKeyEvent& event);
+  void TellFocus();
   void TellSelection();
   void UpdateScrollbar();
   void UpdateTip(size_t line);

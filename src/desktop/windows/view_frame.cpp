@@ -16,6 +16,7 @@
 #include "desktop/windows/file_actions.h"
 #include "desktop/windows/info_frame.h"
 #include "desktop/windows/main_frame.h"
+#include "desktop/windows/screen_reader.h"
 #include "desktop/windows/view_commands.h"
 #include "desktop/windows/wx_text.h"
 #include "platform/clock.h"
@@ -179,8 +180,10 @@ std::string ViewFrame::StatusLine() const {
 void ViewFrame::ViewChanged() {
   if (canvas_ == nullptr || GetStatusBar() == nullptr) return;  // still being made
   const std::string line = StatusLine();
-  SetTitle(Shown(platform::FileNameOf(list_[place_])) + " - View");
+  const wxString name = Shown(platform::FileNameOf(list_[place_]));
+  SetTitle(name + " - View");
   SetStatusText(Shown(line));
+  TellScreenReader(*canvas_, name, Shown(line));
   canvas_->SetOverlay(overlay_ ? line : std::string());
 }
 
