@@ -1,6 +1,27 @@
+#include "formats/jpeg_segments.h"
+#include "metadata/turned_jpeg.h"
 #include "support/codec_target.h"
+#include "support/scratch_file.h"
+
+namespace {
+
+using namespace fotomill;
+
+// A file that could be turned is a sound head of a JPEG file, and its EXIF, whatever it was, can be edited again.
+void Turn(std::span<const uint8_t> file) {
+  const uint8_t choice = file.empty() ? uint8_t{0} : file.back();
+  std::vector<uint8_t> made;
+  JpegTurnResult result;
+  const JpegTurnWish wish{.turn = static_cast<Orientation>(1 + choice % 8), .trim = (choice & 8) != 0};
+  if (MakeTurnedJpeg(file, wish, made, result) != Status::Ok || made.empty()) return;
+  JpegHead head;
+  fuzz::Require(ParseJpegHead(made, head) == Status::Ok);
+}
+
+}  // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
   fotomill::fuzz::TryCodec("jpg", data, size);
+  Turn({data, size});
   return 0;
 }

@@ -17,12 +17,6 @@
 // Source: ITU-T T.81 (1992) and T.871 (2011); Adobe Technical Note 5116; XMP specification part 3; ICC.1:2022, annex B.4.
 #include "formats/jpeg.h"
 
-#include <csetjmp>
-#include <cstddef>
-#include <cstdio>  // the library's header wants it first
-
-#include <jpeglib.h>
-
 #include <algorithm>
 #include <cmath>
 #include <cstring>
@@ -34,106 +28,23 @@
 #include "core/choice_lists.h"
 #include "core/limits.h"
 #include "core/settings.h"
+#include "formats/jpeg_library.h"
+#include "formats/jpeg_segments.h"
 #include "platform/file_view.h"
 
 namespace fotomill {
 
 namespace {
 
-constexpr std::string_view kExifHead("Exif\0\0", 6);
-constexpr std::string_view kXmpHead("http://ns.adobe.com/xap/1.0/\0", 29);
 constexpr std::string_view kIccHead("ICC_PROFILE\0", 12);
 constexpr int kApp1 = JPEG_APP0 + 1, kApp2 = JPEG_APP0 + 2;
 constexpr unsigned kWholeSegment = 0xFFFF;
-constexpr size_t kMostSegment = 65533;  // data of one segment
-constexpr int kMostScans = 500;         // of a progressive file; more are an attack on time
-
-// The library reports through these: an error jumps out, a warning is remembered.
-struct JpegErrors {
-  jpeg_error_mgr base;  // first, so that the library's pointer leads to the whole
-  std::jmp_buf jump;
-  bool cutShort = false;  // the data ended within a scan
-  bool endMissing = false;
-  char warning[JMSG_LENGTH_MAX] = {};
-  int code = 0;
-};
-
-JpegErrors& ErrorsOf(j_common_ptr common) { return *static_cast<JpegErrors*>(static_cast<void*>(common->err)); }
-
-[[noreturn]] void OnError(j_common_ptr common) {
-  ErrorsOf(common).code = common->err->msg_code;
-  std::longjmp(ErrorsOf(common).jump, 1);
-}
-
-// Message codes are not part of the library's public header; their texts are stable.
-void OnMessage(j_common_ptr common, int level) {
-  if (level >= 0) return;  // trace
-  ++common->err->num_warnings;
-  JpegErrors& errors = ErrorsOf(common);
-  char text[JMSG_LENGTH_MAX];
-  common->err->format_message(common, text);
-  const std::string_view message(text);
-  if (message.starts_with("Premature end of JPEG file")) {
-    errors.endMissing = true;
-  } else if (message.find("premature end of data segment") != std::string_view::npos) {
-    errors.cutShort = true;
-  }
-  if (errors.warning[0] == 0 && !errors.endMissing) std::memcpy(errors.warning, text, sizeof text);
-}
-
-void OutputNothing(j_common_ptr) {}
-
-void SetErrors(JpegErrors& errors) {
-  jpeg_std_error(&errors.base);
-  errors.base.error_exit = OnError;
-  errors.base.emit_message = OnMessage;
-  errors.base.output_message = OutputNothing;
-}
-
-// Runs library calls; false when one of them failed. Nothing with a destructor may live inside `action`.
-template <typename Action>
-bool Guarded(JpegErrors& errors, Action action) {
-  if (setjmp(errors.jump) != 0) return false;
-  action();
-  return true;
-}
-
-struct JpegReader {
-  JpegReader() {
-    SetErrors(errors);
-    info.err = &errors.base;
-  }
-  ~JpegReader() { jpeg_destroy_decompress(&info); }
-  JpegReader(const JpegReader&) = delete;
-  JpegReader& operator=(const JpegReader&) = delete;
-
-  // What a failed library call means.
-  Status Failure() {
-    char text[JMSG_LENGTH_MAX];
-    errors.base.format_message(static_cast<j_common_ptr>(static_cast<void*>(&info)), text);
-    const std::string_view message(text);
-    if (message.starts_with("Unsupported") || message.starts_with("Sorry")) return Status::UnsupportedFormat;
-    if (message.starts_with("Insufficient memory")) return Status::MemoryAllocationError;
-    return errors.endMissing ? Status::FileReadError : Status::DamagedFile;
-  }
-
-  JpegErrors errors;
-  jpeg_decompress_struct info = {};
-};
 
 // Reads up to the first scan, keeping the segments that travel.
 Status ReadHeader(JpegReader& reader, std::span<const uint8_t> file) {
-  if (file.size() < 4) return Status::FileReadError;
-  if (file[0] != 0xFF || file[1] != 0xD8) return Status::DamagedFile;
-  const bool read = Guarded(reader.errors, [&] {
-    jpeg_create_decompress(&reader.info);
-    jpeg_mem_src(&reader.info, file.data(), file.size());
-    jpeg_save_markers(&reader.info, kApp1, kWholeSegment);
-    jpeg_save_markers(&reader.info, kApp2, kWholeSegment);
-    jpeg_save_markers(&reader.info, JPEG_COM, kWholeSegment);
-    jpeg_read_header(&reader.info, TRUE);
+  return ReadJpegHeader(reader, file, [](j_decompress_ptr info) {
+    for (const int marker : {kApp1, kApp2, JPEG_COM}) jpeg_save_markers(info, marker, kWholeSegment);
   });
-  return read ? Status::Ok : reader.Failure();
 }
 
 bool IsGrey(const jpeg_decompress_struct& info) { return info.jpeg_color_space == JCS_GRAYSCALE; }
@@ -221,20 +132,11 @@ void CmykToBgr(const uint8_t* ink, uint8_t* color, size_t width, bool inverted) 
   }
 }
 
-// Called by the library now and then while it reads scans.
-void LimitScans(j_common_ptr common) {
-  const auto* info = static_cast<const jpeg_decompress_struct*>(static_cast<void*>(common));
-  if (info->input_scan_number > kMostScans) common->err->error_exit(common);
-}
-
 Status ReadPixels(JpegReader& reader, const PictureRecord& picture, PackedImage& image) {
   jpeg_decompress_struct& info = reader.info;
   const bool cmyk = info.out_color_space == JCS_CMYK;
-  jpeg_progress_mgr monitor = {};
-  monitor.progress_monitor = LimitScans;
   std::vector<uint8_t> ink(cmyk ? 4 * static_cast<size_t>(info.output_width) : 0);
   const bool read = Guarded(reader.errors, [&] {
-    info.progress = &monitor;
     jpeg_start_decompress(&info);
     while (info.output_scanline < info.output_height) {
       const auto y = static_cast<int32_t>(info.output_scanline);
@@ -251,7 +153,7 @@ Status ReadPixels(JpegReader& reader, const PictureRecord& picture, PackedImage&
 
 struct JpegWriter {
   JpegWriter() {
-    SetErrors(errors);
+    errors.Set();
     info.err = &errors.base;
   }
   ~JpegWriter() { jpeg_destroy_compress(&info); }

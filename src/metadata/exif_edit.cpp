@@ -30,6 +30,9 @@ constexpr ThumbnailField kThumbnailFields[] = {
 };
 constexpr uint64_t kResolutionSize = 8;
 
+// A block whose first directory is empty.
+constexpr uint8_t kEmptyBlock[] = {'I', 'I', kExifMagic, 0, kExifHeaderSize, 0, 0, 0, 0, 0, 0, 0, 0, 0};
+
 struct Range {
   uint64_t begin, end;
 };
@@ -102,6 +105,27 @@ void SetField(std::span<uint8_t> bytes, const ExifBytes& block, const Directory&
   if (number <= 0 || !field) return;
   const bool asLong = number > 0xffff || (field->type == kExifLong && field->count == 1);
   PutField(bytes, block.BigEndian(), field->entryOffset, asLong ? kExifLong : kExifShort, static_cast<uint32_t>(number));
+}
+
+// Moves the first directory to the end of the block, with an empty SHORT more in the order of the tags.
+void AddField(std::vector<uint8_t>& block, const Directory& first, uint16_t tag) {
+  const bool bigEndian = OpenExifBytes(block).BigEndian();
+  const uint64_t offset = block.size() + block.size() % 2;
+  const Directory moved{offset, first.count + 1, true};
+  block.resize(moved.Whole().end);
+  const ExifBytes numbers(block, bigEndian);
+  uint32_t before = 0;
+  while (before < first.count && numbers.U16(first.EntryOffset(before)) < tag) ++before;
+  const auto copy = [&](uint64_t from, uint64_t size, uint64_t to) {
+    std::copy_n(block.begin() + static_cast<std::ptrdiff_t>(from), size, block.begin() + static_cast<std::ptrdiff_t>(to));
+  };
+  copy(first.EntryOffset(0), before * kExifEntrySize, moved.EntryOffset(0));
+  copy(first.EntryOffset(before), (first.count - before) * kExifEntrySize, moved.EntryOffset(before + 1));
+  if (first.linked) copy(first.LinkOffset(), kExifLinkSize, moved.LinkOffset());
+  Put16(block, bigEndian, moved.offset, static_cast<uint16_t>(moved.count));
+  Put16(block, bigEndian, moved.EntryOffset(before), tag);
+  PutField(block, bigEndian, moved.EntryOffset(before), kExifShort, 0);
+  Put32(block, bigEndian, 4, static_cast<uint32_t>(offset));
 }
 
 // Adds the bytes of a directory and of the values that its entries keep elsewhere in the block.
@@ -205,6 +229,20 @@ void SetExifPictureFacts(std::span<uint8_t> block, const ExifPictureFacts& facts
   SetField(block, numbers, *first, kImageWidth, facts.width);
   SetField(block, numbers, *first, kImageHeight, facts.height);
   SetField(block, numbers, *first, kOrientation, facts.orientation);
+}
+
+bool PutExifOrientation(std::vector<uint8_t>& block, int32_t orientation) {
+  if (block.empty()) block.assign(std::begin(kEmptyBlock), std::end(kEmptyBlock));
+  const ExifBytes numbers = OpenExifBytes(block);
+  if (numbers.U16(2) != kExifMagic) return false;
+  const uint64_t begin = numbers.U32(4);
+  const bool empty = begin >= kExifHeaderSize && begin + kExifCountSize <= block.size() && numbers.U16(begin) == 0;
+  const auto first = empty ? std::optional(Directory{begin, 0, begin + kExifCountSize + kExifLinkSize <= block.size()})
+                           : FirstDirectory(numbers);
+  if (!first) return false;
+  if (!FindField(numbers, *first, kOrientation)) AddField(block, *first, kOrientation);
+  SetExifPictureFacts(block, {.orientation = orientation});
+  return true;
 }
 
 void DropExifThumbnail(std::vector<uint8_t>& block) {

@@ -2,6 +2,7 @@
 
 #include <cstdint>
 #include <span>
+#include <vector>
 
 #include "core/status.h"
 #include "picture/picture_record.h"
@@ -12,5 +13,7 @@ namespace fotomill {
 // `picture` is null unless Ok; EmptyImage (31) without bytes, ErrorCreatingFile (10) or ErrorWritingFile (11) for the working file,
 // else the status of the JPEG codec.
 Status DecodeExifThumbnail(std::span<const uint8_t> bytes, PicturePointer& picture);
+// The way back; `bytes` is empty unless Ok.
+Status EncodeExifThumbnail(PictureRecord& picture, std::vector<uint8_t>& bytes);
 
 }  // namespace fotomill

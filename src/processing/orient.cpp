@@ -12,26 +12,6 @@ namespace {
 // Pixels of a tile's side: source and destination of a tile stay in the first cache while rows become columns.
 constexpr int32_t kTile = 32;
 
-// An orientation as: does the destination's column run along the source's rows, and which ends are exchanged, counted
-// in the source.
-struct Turn {
-  bool swap, flipX, flipY;
-};
-
-constexpr Turn TurnOf(Orientation orientation) {
-  switch (orientation) {
-    case Orientation::MirrorAcross: return {false, true, false};
-    case Orientation::HalfTurn: return {false, true, true};
-    case Orientation::MirrorDown: return {false, false, true};
-    case Orientation::Transpose: return {true, false, false};
-    case Orientation::QuarterRight: return {true, false, true};
-    case Orientation::Transverse: return {true, true, true};
-    case Orientation::QuarterLeft: return {true, true, false};
-    case Orientation::Upright: break;
-  }
-  return {false, false, false};
-}
-
 // Source and destination as grids of pixels of `bytes` each, addressed from the top.
 template <int bytes>
 void TurnTile(const PackedImage& from, PackedImage& to, Turn turn, int32_t left, int32_t top) {
@@ -97,9 +77,8 @@ Status TurnImage(const PackedImage& image, Turn turn, PackedImage& turned) {
 }  // namespace
 
 Status OrientPicture(PictureRecord& picture, Orientation orientation) {
-  if (orientation <= Orientation::Upright || orientation > Orientation::QuarterLeft) return Status::Ok;
-  if (picture.image.Empty()) return Status::Ok;
   const Turn turn = TurnOf(orientation);
+  if (turn == Turn{} || picture.image.Empty()) return Status::Ok;
   PackedImage image, alpha;
   RETURN_IF_BAD(TurnImage(picture.image, turn, image));
   if (!picture.alpha.Empty()) RETURN_IF_BAD(TurnImage(picture.alpha, turn, alpha));

@@ -34,6 +34,19 @@ TEST(Orient, TheLetterFStandsUpright) {
   }
 }
 
+TEST(Orient, TwoTurnsAreOne) {
+  for (int32_t pair = 0; pair < 64; ++pair) {
+    const auto first = static_cast<Orientation>(1 + pair / 8), then = static_cast<Orientation>(1 + pair % 8);
+    const auto number = [](int32_t x, int32_t y) { return static_cast<uint32_t>(3 * y + x); };
+    const PicturePointer twice = MakePicture(3, 2, number), once = MakePicture(3, 2, number);
+    ASSERT_EQ(OrientPicture(*twice, first), Status::Ok);
+    ASSERT_EQ(OrientPicture(*twice, then), Status::Ok);
+    ASSERT_EQ(OrientPicture(*once, Composed(first, then)), Status::Ok);
+    EXPECT_EQ(Colors(*once), Colors(*twice)) << pair;
+    EXPECT_EQ(once->width, twice->width) << pair;
+  }
+}
+
 TEST(Orient, UndoneByItsInverseAtEveryDepth) {
   constexpr int32_t kInverse[] = {0, 1, 2, 3, 4, 5, 8, 7, 6};
   for (const int32_t bits : {1, 4, 8, 24}) {

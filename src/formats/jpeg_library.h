@@ -1,0 +1,55 @@
+#pragma once
+
+#include <csetjmp>
+#include <cstddef>
+#include <cstdint>
+#include <cstdio>  // the library's header wants it first
+
+#include <jpeglib.h>
+
+#include <span>
+
+#include "core/status.h"
+
+namespace fotomill {
+
+// How the JPEG codec talks to its library: an error jumps out of it, a warning is remembered.
+struct JpegErrors {
+  jpeg_error_mgr base;  // first, so that the library's pointer leads to the whole
+  std::jmp_buf jump;
+  bool cutShort = false;  // the data ended within a scan
+  bool endMissing = false;
+  char warning[JMSG_LENGTH_MAX] = {};  // the first one, but for a missing end
+  int code = 0;
+
+  void Set();
+  // What a failed library call means; `common` is what it was called for.
+  Status Meaning(j_common_ptr common);
+};
+
+// Runs library calls; false when one of them failed. Nothing with a destructor may live inside `action`.
+template <typename Action>
+bool Guarded(JpegErrors& errors, Action action) {
+  if (setjmp(errors.jump) != 0) return false;
+  action();
+  return true;
+}
+
+struct JpegReader {
+  JpegReader();
+  ~JpegReader() { jpeg_destroy_decompress(&info); }
+  JpegReader(const JpegReader&) = delete;
+  JpegReader& operator=(const JpegReader&) = delete;
+
+  Status Failure() { return errors.Meaning(static_cast<j_common_ptr>(static_cast<void*>(&info))); }
+
+  JpegErrors errors;
+  jpeg_decompress_struct info = {};
+  jpeg_progress_mgr monitor = {};  // ends files of absurdly many scans
+};
+
+// Reads a file up to its first scan; `prepare` is called before and may ask for segments to be kept. `file` must stay until
+// the reader is done.
+Status ReadJpegHeader(JpegReader& reader, std::span<const uint8_t> file, void (*prepare)(j_decompress_ptr info) = nullptr);
+
+}  // namespace fotomill

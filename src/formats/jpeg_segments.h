@@ -1,0 +1,49 @@
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <span>
+#include <string_view>
+#include <vector>
+
+#include "core/status.h"
+
+namespace fotomill {
+
+inline constexpr std::string_view kExifHead("Exif\0\0", 6);
+inline constexpr std::string_view kXmpHead("http://ns.adobe.com/xap/1.0/\0", 29);
+inline constexpr size_t kMostSegment = 65533;  // data of one segment
+inline constexpr size_t kMostExif = kMostSegment - 6, kMostXmp = kMostSegment - 29;
+
+// The head of a JPEG file: the segments in front of the first scan. All spans are into the file.
+struct JpegSegment {
+  uint8_t marker = 0;
+  std::span<const uint8_t> data;   // behind the length
+  std::span<const uint8_t> whole;  // with marker and length
+  bool Starts(std::string_view head) const;
+};
+struct JpegHead {
+  std::vector<JpegSegment> segments;
+  size_t scan = 0;  // where the first scan begins
+
+  // What the first EXIF and XMP segments hold behind their headings; empty when there is none.
+  std::span<const uint8_t> Exif() const;
+  std::span<const uint8_t> Xmp() const;
+  // Whether further pictures lie behind the first, with an index of their places (CIPA DC-007, "MPF").
+  bool HasMorePictures() const;
+};
+// DamagedFile (2) when the file is none, FileReadError (3) when it ends before its first scan.
+Status ParseJpegHead(std::span<const uint8_t> file, JpegHead& head);
+
+// A new file from the application segments and comments of an old one and from other pixels.
+struct JpegParts {
+  std::span<const uint8_t> exif = {}, xmp = {};  // replace those of the old file, or are added; empty: these stay as they are
+  std::span<const uint8_t> pixels = {};          // a JPEG file without such segments; empty: everything else stays as it is
+  std::span<const uint8_t> rest = {};            // bytes behind the end of the picture
+  bool swapSides = false;                        // the resolutions change places
+};
+// UnsuitableImage (13) when EXIF or XMP are too long for a segment. With pixels the thumbnails of JFIF, which show the old
+// ones, are left out.
+Status AssembleJpeg(std::span<const uint8_t> file, const JpegHead& head, const JpegParts& parts, std::vector<uint8_t>& made);
+
+}  // namespace fotomill
