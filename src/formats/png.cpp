@@ -76,10 +76,24 @@ struct PngLayout {
   RowForm rows = RowForm::Direct;
 };
 
+// Whether the chunks in front of the pixels lie in the file: for one that only claims a size the library would make room.
+bool HeadLiesInFile(std::span<const uint8_t> file) {
+  constexpr uint64_t kSignature = 8, kTypeAndCrc = 8;
+  ByteReader bytes(file);
+  bytes.Skip(kSignature);
+  while (bytes.Ok()) {
+    const uint32_t size = bytes.Be32();
+    if (bytes.Match("IDAT")) return true;
+    bytes.Skip(kTypeAndCrc + size);
+  }
+  return false;
+}
+
 // Reads everything before the pixels and sets up the conversions.
 Status ReadHeader(PngReader& reader) {
   if (!reader.Ready()) return Status::MemoryAllocationError;
   if (png_sig_cmp(reader.bytes.Peek(8).data(), 0, reader.bytes.Peek(8).size()) != 0) return Status::DamagedFile;
+  if (!HeadLiesInFile(reader.file)) return Status::FileReadError;
   const bool read = PngGuarded(reader.png, [&] {
     png_set_read_fn(reader.png, &reader, ReadBytes);
     png_set_user_limits(reader.png, kMostSide, kMostSide);

@@ -77,6 +77,10 @@ TEST(Png, BrokenFilesFailWithTheirStatus) {
   std::vector<uint8_t> huge = file;  // sizes that no memory holds, and a CRC that no longer fits: refused either way
   for (size_t i = 16; i < 24; ++i) huge[i] = 0x7f;
   EXPECT_NE(Decode(PngRead, huge).status, Status::Ok);
+  std::vector<uint8_t> claims = file;  // a text of 640 MB in a small file
+  constexpr uint8_t kText[] = {0x28, 0, 0, 0, 'z', 'T', 'X', 't'};
+  claims.insert(claims.begin() + 33, std::begin(kText), std::end(kText));  // behind IHDR
+  EXPECT_EQ(Decode(PngRead, claims).status, Status::FileReadError);
 }
 
 }  // namespace
