@@ -28,6 +28,7 @@ constexpr SetupItem kItems[] = {
     {Browsing,   "Files",              DropOptions,                    "When files are dropped on a folder"},
     {Browsing,   "Files",              UndoLevels,                     "Changes that can be taken back"},
     {Browsing,   "Files",              NewFolderName,                  "Name of new folders"},
+    {Browsing,   "Files",              ClipboardPictureName,           "Name of pictures from the clipboard"},
     {Browsing,   "Lists of what was used last", CopyHistoryMax,        "Folders copied or moved to"},
     {Browsing,   "Lists of what was used last", DestHistoryMax,        "Destination folders"},
     {Browsing,   "Lists of what was used last", EditListMaximum,       "Base names of sequential renaming"},

@@ -2,7 +2,9 @@
 
 #include <gmock/gmock.h>
 
+#include "desktop/pasted_picture.h"
 #include "desktop/session.h"
+#include "picture/registry.h"
 #include "support/files.h"
 #include "support/scoped_environment.h"
 
@@ -114,6 +116,20 @@ TEST(FolderViews, AreKeptPerFolderTheLatestFirst) {
   for (int i = 0; i < 499; ++i) views.Keep("/many" + std::to_string(i), otherwise);
   EXPECT_EQ(views.Find("/c", otherwise), otherwise);  // the oldest of 501
   EXPECT_EQ(views.Find("/a,b", otherwise), (FolderView{{2, 4, 2}, true}));
+}
+
+TEST_F(FileDeedsTest, APastedPictureTakesAFreeName) {
+  PastedPicture pasted{FilledImage(2, 1, 0x332211), {255, 7}};
+  for (const char* name : {"Picture from clipboard.png", "Picture from clipboard [1].png"}) {
+    const DeedResult result = KeepPastedPicture(pasted, folder_.Path("to"));
+    ASSERT_EQ(result.done.steps.size(), 1u);
+    EXPECT_EQ(result.done.steps[0].to, To(name));
+    PicturePointer picture;
+    ASSERT_EQ(LoadPicture(To(name).c_str(), picture), Status::Ok);
+    EXPECT_EQ(picture->image.PixelAt(1, 0), 0x112233u);  // red first
+    EXPECT_EQ(picture->alpha.PixelAt(1, 0), 7u);
+  }
+  EXPECT_EQ(KeepPastedPicture(pasted, folder_.Path("none")).failures.size(), 1u);
 }
 
 TEST(Session, ComesBackAndForgivesOddLines) {

@@ -44,6 +44,18 @@ def rename_delete_undo_paste(folder):
         desktop.wait(r"lines=2 .*listing=0 .*folder=.*other$")
         desktop.key("alt+Left")
         desktop.wait(r"lines=4 .*listing=0 .*folder=.*pictures$")
+        # The picture on the clipboard becomes a file, and goes again.
+        desktop.key("Home", "Return")
+        desktop.wait(r"view place=1/4 .*status=0 .*a \[1\].bmp")
+        desktop.focus("View$")
+        desktop.key("ctrl+c", "Escape")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+v")
+        desktop.wait(r"files Paste done=1 failed=0")
+        assert "Picture from clipboard.png" in names(pictures), names(pictures)
+        desktop.key("ctrl+z")
+        desktop.wait(r"files Undo output of Picture from clipboard.png done=1")
+        desktop.wait(r"lines=4 .*listing=0")
         # Deleted while it is looked at: the next one comes.
         desktop.key("Home", "Return")
         desktop.wait(r"view place=1/4 .*status=0 .*a \[1\].bmp")

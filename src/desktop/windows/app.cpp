@@ -1,5 +1,6 @@
 #include <wx/app.h>
 #include <wx/cmdline.h>
+#include <wx/image.h>
 
 #include "core/configuration.h"
 #include "core/data_folder.h"
@@ -52,6 +53,7 @@ class App : public wxApp {
     SetAppName("fotomill-desktop");
     SetAppDisplayName("Fotomill Professional");
     if (!wxApp::OnInit()) return false;
+    wxImage::AddHandler(new wxPNGHandler);  // pictures travel over the clipboard as PNG
     SetDataFolder({});
     (void)LoadConfiguration();
     TakeFormatSwitches();

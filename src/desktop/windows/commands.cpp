@@ -110,7 +110,7 @@ constexpr Command kCommands[] = {
     {kEdit, nullptr},
     {kEdit, "Cu&t",                "Ctrl+X",       "Puts the files on the clipboard, to be moved.", Needs::Item, Cut},
     {kEdit, "&Copy",               "Ctrl+C",       "Puts the files on the clipboard, to be copied.", Needs::Item, Copy, nullptr, true},
-    {kEdit, "&Paste",              "Ctrl+V",       "Copies or moves the files of the clipboard to this folder.", Needs::Nothing, Paste},
+    {kEdit, "&Paste",              "Ctrl+V",       "Copies or moves the files of the clipboard to this folder; a picture becomes a file.", Needs::Nothing, Paste},
     {kEdit, "Copy pat&hs",         "Ctrl+Shift+C", "Puts the paths of the files on the clipboard as text.", Needs::Item, CopyPaths, nullptr, true},
     {kEdit, nullptr},
     {kEdit, "&Rename...",          "F2",           "Gives the focused file another name.", Needs::Item, OfBrowser<&BrowserPage::EditFocusedName>, nullptr, true},

@@ -4,6 +4,7 @@
 #include <wx/dataobj.h>
 #include <wx/filename.h>
 #include <wx/filesys.h>
+#include <wx/image.h>
 #include <wx/msgdlg.h>
 #include <wx/textdlg.h>
 
@@ -13,6 +14,7 @@
 #include "core/plain_name.h"
 #include "core/settings.h"
 #include "desktop/event_log.h"
+#include "desktop/pasted_picture.h"
 #include "desktop/windows/folder_dialog.h"
 #include "desktop/windows/main_frame.h"
 #include "desktop/windows/wx_text.h"
@@ -22,6 +24,17 @@
 namespace fotomill::desktop {
 
 namespace {
+
+PastedPicture PictureOf(const wxBitmap& bitmap) {
+  const wxImage image = bitmap.ConvertToImage();
+  const size_t count = static_cast<size_t>(image.GetWidth()) * static_cast<size_t>(image.GetHeight());
+  PastedPicture picture;
+  picture.pixels.width = image.GetWidth();
+  picture.pixels.height = image.GetHeight();
+  picture.pixels.bytes.assign(image.GetData(), image.GetData() + 3 * count);
+  if (image.HasAlpha()) picture.alpha.assign(image.GetAlpha(), image.GetAlpha() + count);
+  return picture;
+}
 
 constexpr const char* kGnomeFiles = "x-special/gnome-copied-files";  // "cut" or "copy", then a URL a line
 constexpr size_t kMostFailuresShown = 10;
@@ -197,7 +210,8 @@ void FileActions::Paste(const std::string& folder) {
   bool cut = false;
   {
     const wxClipboardLocker clipboard;
-    if (!clipboard || !wxTheClipboard->GetData(files)) return frame_.Tell("There are no files on the clipboard.");
+    if (!clipboard) return wxBell();
+    if (!wxTheClipboard->GetData(files)) return PastePicture(folder);
     if (wxTheClipboard->GetData(marked)) {
       cut = std::string(static_cast<const char*>(marked.GetData()), marked.GetSize()).starts_with("cut");
     }
@@ -206,6 +220,24 @@ void FileActions::Paste(const std::string& folder) {
   std::vector<std::string> paths;
   for (const wxString& name : files.GetFilenames()) paths.push_back(Utf8(name));
   Do(cut ? DeedKind::Move : DeedKind::Copy, paths, folder);
+}
+
+// With the clipboard open.
+void FileActions::PastePicture(const std::string& folder) {
+  wxBitmapDataObject bitmap;
+  if (!wxTheClipboard->GetData(bitmap) || !bitmap.GetBitmap().IsOk()) {
+    return frame_.Tell("There are no files and no picture on the clipboard.");
+  }
+  Run(
+      "Paste",
+      [picture = PictureOf(bitmap.GetBitmap()), folder](const DeedProgress&) { return KeepPastedPicture(picture, folder); },
+      [this](DeedResult result) {
+        const std::vector<FileStep> made = result.done.steps;
+        undo_.Add(std::move(result.done));
+        BrowserPage* const browser = frame_.Browser();
+        if (browser != nullptr && !made.empty())
+          browser->Open(browser->Model().Folder(), std::string(platform::FileNameOf(made[0].to)));
+      });
 }
 
 // --- functions of the menu ---

@@ -42,6 +42,7 @@ class FileActions : public wxEvtHandler {
   // The clipboard holds the files for other programs too; `cut` asks whoever pastes to move them.
   void ToClipboard(const std::vector<std::string>& paths, bool cut);
   void PathsToClipboard(const std::vector<std::string>& paths);
+  // Files, or else a picture, which becomes a file.
   void Paste(const std::string& folder);
 
  private:
@@ -50,6 +51,7 @@ class FileActions : public wxEvtHandler {
   void Run(const std::string& what, Work work, Then then);
   void Do(DeedKind kind, const std::vector<std::string>& paths, const std::string& folder);
   void Finished(const std::string& what, DeedResult result, const Then& then);
+  void PastePicture(const std::string& folder);
   void TellFailures(const std::vector<DeedFailure>& failures);
 
   MainFrame& frame_;
