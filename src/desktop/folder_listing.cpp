@@ -1,8 +1,10 @@
 #include "desktop/folder_listing.h"
 
+#include <algorithm>
 #include <unordered_map>
 
 #include "core/text.h"
+#include "desktop/natural_order.h"
 #include "metadata/exif_source.h"
 #include "metadata/exif_walk.h"
 #include "picture/registry.h"
@@ -63,6 +65,15 @@ FolderListing ListForBrowser(const std::string& folder, bool facts, const std::a
   }
   if (facts) AddFacts(folder, listing, stop);
   return listing;
+}
+
+std::vector<std::string> SubfolderNames(const std::string& folder) {
+  std::vector<std::string> names;
+  for (const platform::FolderEntry& entry : platform::ListFolder(folder).value_or(std::vector<platform::FolderEntry>())) {
+    if (entry.kind == platform::FileKind::Folder && !entry.name.starts_with('.')) names.push_back(entry.name);
+  }
+  std::sort(names.begin(), names.end(), [](const auto& a, const auto& b) { return CompareNatural(a, b) < 0; });
+  return names;
 }
 
 void AddFacts(const std::string& folder, FolderListing& listing, const std::atomic<bool>& stop) {

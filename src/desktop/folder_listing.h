@@ -29,6 +29,9 @@ struct FolderListing {
 // `facts` off, sizes and times stay 0, which is many times faster. Ends early, with what it has, when `stop` turns true.
 FolderListing ListForBrowser(const std::string& folder, bool facts, const std::atomic<bool>& stop);
 
+// The names of the folders in a folder, without hidden ones, in order.
+std::vector<std::string> SubfolderNames(const std::string& folder);
+
 // Fills in size and time of listed items.
 void AddFacts(const std::string& folder, FolderListing& listing, const std::atomic<bool>& stop);
 

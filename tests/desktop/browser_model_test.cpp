@@ -4,7 +4,9 @@
 
 #include "core/choice_lists.h"
 #include "desktop/cell_layout.h"
+#include "desktop/folder_trail.h"
 #include "desktop/natural_order.h"
+#include "desktop/path_crumbs.h"
 
 namespace fotomill::desktop {
 namespace {
@@ -105,6 +107,33 @@ TEST(BrowserModel, KnownFactsStayWithUnchangedFiles) {
   changed[0].modified = 5;
   model.SetItems(changed);
   EXPECT_EQ(model.Item(0).width, 0);
+}
+
+TEST(PathBar, CrumbsAndTrail) {
+  EXPECT_EQ(CrumbsOf("/a/b c"), (std::vector<Crumb>{{"/", "/"}, {"a", "/a"}, {"b c", "/a/b c"}}));
+  EXPECT_EQ(CrumbsOf("/"), (std::vector<Crumb>{{"/", "/"}}));
+  const int widths[] = {30, 50, 40};
+  struct {
+    int room;
+    size_t first;
+  } const rows[] = {{120, 0}, {119, 1}, {110, 1}, {109, 2}, {0, 2}};
+  for (const auto& row : rows) EXPECT_EQ(FirstCrumbShown(widths, row.room, 20), row.first) << row.room;
+
+  const std::vector<std::string> names = {"Sub", "sub1", "sub2", "other"};
+  EXPECT_EQ(Completions("/a/s", names), (std::vector<std::string>{"/a/sub1", "/a/sub2", "/a/Sub"}));
+  for (const char* complete : {"/a/", "/a/other", "/a/x", ""}) EXPECT_TRUE(Completions(complete, names).empty()) << complete;
+
+  FolderTrail trail;
+  for (const char* folder : {"/a", "/b", "/c"}) trail.Go(folder);
+  EXPECT_EQ(trail.Step(-2), "/a");
+  EXPECT_FALSE(trail.CanStep(-1));
+  EXPECT_TRUE(trail.CanStep(2));
+  trail.Go("/d");
+  EXPECT_FALSE(trail.CanStep(1));
+  for (int i = 0; i < 150; ++i) trail.Go("/" + std::to_string(i));
+  EXPECT_TRUE(trail.CanStep(-99));
+  EXPECT_FALSE(trail.CanStep(-100));
+  EXPECT_EQ(trail.FolderAt(-99), "/50");
 }
 
 TEST(BrowserModel, TypingFinds) {

@@ -20,6 +20,7 @@ constexpr SymbolShape kSymbols[] = {
     {"back", "<path d='M10 3 L5 8 L10 13'/>"},
     {"forward", "<path d='M6 3 L11 8 L6 13'/>"},
     {"up", "<path d='M3 9 L8 4 L13 9 M8 4 V13'/>"},
+    {"below", "<path d='M3.5 6 L8 10.5 L12.5 6'/>"},
     {"refresh", "<path d='M13 8 A5 5 0 1 1 11.3 4.2 M11.5 1.5 V4.5 H8.5'/>"},
     {"folder", "<path d='M1.5 4 V13 H14.5 V5.5 H8 L6.5 3.5 H2 Z'/>"},
     {"home", "<path d='M2 8 L8 2.5 L14 8 M3.5 7 V13.5 H12.5 V7 M6.5 13.5 V9.5 H9.5 V13.5'/>"},

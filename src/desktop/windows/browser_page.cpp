@@ -39,12 +39,13 @@ BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& 
       offer_(this, {[this] { FocusList(); }, [this] { canvas_->WantThumbnails(); }}) {
   model_.SetView(view);
   auto* bar = new wxBoxSizer(wxHORIZONTAL);
-  path_ = new PathBar(this, {[this](int steps) { StepAlongTrail(steps); }, [this] { GoUp(); },
-                             [this](const std::string& folder) {
-                               Open(folder);
-                               FocusList();
-                             },
-                             [this] { LeaveBar(); }});
+  path_ = new PathBar(this, trail_,
+                      {[this](int steps) { StepAlongTrail(steps); }, [this] { GoUp(); },
+                       [this](const std::string& folder) {
+                         Open(folder);
+                         FocusList();
+                       },
+                       [this] { LeaveBar(); }});
   bar->Add(path_, wxSizerFlags(1).CenterVertical());
   BuildFilter();
   bar->Add(filter_, wxSizerFlags().CenterVertical().Border(wxRIGHT, FromDIP(4)));
@@ -289,6 +290,7 @@ void BrowserPage::EditFocusedName() {
 }
 
 void BrowserPage::EditPath() { path_->Edit(); }
+void BrowserPage::OfferTrail() { path_->OfferTrail(); }
 
 void BrowserPage::EditFilter() { filter_->SetFocus(); }
 

@@ -60,6 +60,7 @@ class BrowserPage : public wxPanel {
   void FocusName(const std::string& name);
   void EditFocusedName();
   void EditPath();
+  void OfferTrail();
   void EditFilter();
   // This browser comes to the front.
   void Activated();

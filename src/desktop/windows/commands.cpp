@@ -147,6 +147,7 @@ constexpr Command kCommands[] = {
 
     {kGo, "&Back",                 "Alt+Left",     "Goes to the folder before this one.", Needs::Nothing, OfBrowser<&BrowserPage::GoBack>},
     {kGo, "&Forward",              "Alt+Right",    "Goes forward again.", Needs::Nothing, OfBrowser<&BrowserPage::GoForward>},
+    {kGo, "Folders gone t&hrough...", "Alt+Down",  "Offers the folders that this tab showed.", Needs::Nothing, OfBrowser<&BrowserPage::OfferTrail>},
     {kGo, "&Parent folder",        "Alt+Up",       "Goes to the folder above this one.", Needs::Nothing, OfBrowser<&BrowserPage::GoUp>},
     {kGo, "&Enter a folder",       "Ctrl+L",       "Lets you type a folder.", Needs::Nothing, OfBrowser<&BrowserPage::EditPath>},
     {kGo, nullptr},

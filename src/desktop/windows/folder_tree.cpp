@@ -2,13 +2,11 @@
 
 #include <wx/app.h>
 
-#include <algorithm>
 #include <thread>
 
-#include "desktop/natural_order.h"
+#include "desktop/folder_listing.h"
 #include "desktop/windows/bitmaps.h"
 #include "desktop/windows/wx_text.h"
-#include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
 
@@ -76,11 +74,7 @@ void FolderTree::Fill(const wxTreeItemId& item) {
   data->filled = true;
   const std::weak_ptr<bool> alive = alive_;
   std::thread([this, alive, folder = data->folder] {
-    std::vector<std::string> names;
-    for (const platform::FolderEntry& entry : platform::ListFolder(folder).value_or(std::vector<platform::FolderEntry>())) {
-      if (entry.kind == platform::FileKind::Folder && !entry.name.starts_with('.')) names.push_back(entry.name);
-    }
-    std::sort(names.begin(), names.end(), [](const auto& a, const auto& b) { return CompareNatural(a, b) < 0; });
+    std::vector<std::string> names = SubfolderNames(folder);
     wxTheApp->CallAfter([this, alive, folder, names = std::move(names)] {
       if (!alive.expired()) TakeNames(folder, names);
     });

@@ -3,17 +3,36 @@
 #include <wx/bmpbuttn.h>
 #include <wx/sizer.h>
 #include <wx/textctrl.h>
-#include <wx/utils.h>
 
+#include <algorithm>
+#include <vector>
+
+#include "desktop/event_log.h"
+#include "desktop/folder_listing.h"
+#include "desktop/folder_trail.h"
 #include "desktop/windows/bitmaps.h"
+#include "desktop/windows/crumb_strip.h"
+#include "desktop/windows/folder_menu.h"
 #include "desktop/windows/wx_text.h"
 #include "platform/files.h"
 #include "platform/folders.h"
+#include "platform/paths.h"
 
 namespace fotomill::desktop {
 
-PathBar::PathBar(wxWindow* parent, Events events)
+namespace {
+
+// What is typed may begin with "~" for the home folder.
+std::string FolderTyped(std::string typed) {
+  if (typed.starts_with('~')) typed.replace(0, 1, platform::SpecialFolderPath(platform::SpecialFolder::Home));
+  return platform::AbsolutePath(typed);
+}
+
+}  // namespace
+
+PathBar::PathBar(wxWindow* parent, const FolderTrail& trail, Events events)
     : wxPanel(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTAB_TRAVERSAL | wxBORDER_NONE, "Path"),
+      trail_(trail),
       events_(std::move(events)) {
   auto* row = new wxBoxSizer(wxHORIZONTAL);
   const int gap = FromDIP(4);
@@ -23,38 +42,134 @@ PathBar::PathBar(wxWindow* parent, Events events)
     made->SetToolTip(tip);
     made->Bind(wxEVT_BUTTON, [run](wxCommandEvent&) { run(); });
     row->Add(made, wxSizerFlags().CenterVertical().Border(wxLEFT, gap));
+    return made;
   };
-  button("back", "Back", [this] { events_.step(-1); });
-  button("forward", "Forward", [this] { events_.step(1); });
+  back_ = button("back", "Back", [this] { events_.step(-1); });
+  forward_ = button("forward", "Forward", [this] { events_.step(1); });
   button("up", "Parent folder", [this] { events_.up(); });
-  path_ = new wxTextCtrl(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxTE_PROCESS_ENTER, wxDefaultValidator, "Folder");
-  path_->AutoCompleteDirectories();
-  path_->Bind(wxEVT_TEXT_ENTER, [this](wxCommandEvent&) { TakeTyped(); });
-  path_->Bind(wxEVT_KEY_DOWN, [this](wxKeyEvent& event) {
+  back_->Bind(wxEVT_CONTEXT_MENU, [this](wxContextMenuEvent&) { OfferSteps(*back_, -1); });
+  forward_->Bind(wxEVT_CONTEXT_MENU, [this](wxContextMenuEvent&) { OfferSteps(*forward_, 1); });
+  crumbs_ = new CrumbStrip(this, {events_.open, [this] { Edit(); }});
+  row->Add(crumbs_, wxSizerFlags(1).Expand().Border(wxALL, gap));
+  BuildEdit();
+  row->Add(edit_, wxSizerFlags(1).CenterVertical().Border(wxALL, gap));
+  SetSizer(row);
+}
+
+void PathBar::BuildEdit() {
+  edit_ = new wxTextCtrl(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxTE_PROCESS_ENTER, wxDefaultValidator, "Folder");
+  edit_->Bind(wxEVT_TEXT, [this](wxCommandEvent&) { ReadNames(); });
+  edit_->Hide();
+  edit_->Bind(wxEVT_TEXT_ENTER, [this](wxCommandEvent&) { TakeTyped(); });
+  edit_->Bind(wxEVT_KEY_DOWN, [this](wxKeyEvent& event) {
+    if (event.GetKeyCode() == WXK_DOWN) return ShowCompletion(1);
+    if (event.GetKeyCode() == WXK_UP) return ShowCompletion(-1);
     if (event.GetKeyCode() != WXK_ESCAPE) return event.Skip();
-    ShowFolder(folder_);
+    ShowEdit(false);
     events_.left();
   });
-  row->Add(path_, wxSizerFlags(1).CenterVertical().Border(wxALL, gap));
-  SetSizer(row);
+  edit_->Bind(wxEVT_KILL_FOCUS, [this](wxFocusEvent& event) {
+    CallAfter([this] {
+      if (!edit_->HasFocus()) ShowEdit(false);
+    });
+    event.Skip();
+  });
 }
 
 void PathBar::ShowFolder(const std::string& folder) {
   folder_ = folder;
-  path_->ChangeValue(Shown(folder));
+  back_->Enable(trail_.CanStep(-1));
+  forward_->Enable(trail_.CanStep(1));
+  crumbs_->ShowFolder(folder);
+  ShowEdit(false);
 }
 
 void PathBar::Edit() {
-  path_->SetFocus();
-  path_->SelectAll();
+  edit_->ChangeValue(Shown(folder_));
+  ShowEdit(true);
+  edit_->SetFocus();
+  edit_->SelectAll();
+  namesOf_.clear();
+  typedLength_ = edit_->GetValue().length();
+  ReadNames();
+}
+
+// The folders beside what is typed are read apart, since a folder may hang, and complete it once they are there.
+void PathBar::ReadNames() {
+  const std::string above(platform::SplitPath(Utf8(edit_->GetValue())).folder);
+  if (above.empty() || above == namesOf_) return CallAfter([this] { CompleteTyped(); });
+  namesOf_ = above;
+  names_.clear();
+  reading_.Start([this, above](const std::atomic<bool>&, const LooseWork::Tell& tell) {
+    tell([this, names = SubfolderNames(FolderTyped(above))] {
+      names_ = names;
+      LogEvent("completions", std::to_string(names.size()));
+      CompleteTyped();
+    });
+  });
+}
+
+// The field's text without what completes it.
+wxString PathBar::Typed() const {
+  long from = 0, to = 0;
+  edit_->GetSelection(&from, &to);
+  const bool completed = from != to && to == edit_->GetLastPosition();
+  return completed ? edit_->GetValue().Left(static_cast<size_t>(from)) : edit_->GetValue();
+}
+
+// Completes what has become longer by typing at its end.
+void PathBar::CompleteTyped() {
+  const wxString typed = Typed();
+  const bool longer = typed.length() > typedLength_ && edit_->GetInsertionPoint() == edit_->GetLastPosition();
+  typedLength_ = typed.length();
+  if (longer && typed == edit_->GetValue()) ShowCompletion(0);
+}
+
+// Puts a way how the path may go on behind what was typed, marked, so that typing on replaces it. `step` goes on to the next.
+void PathBar::ShowCompletion(int step) {
+  const wxString typed = Typed();
+  const std::vector<std::string> paths = Completions(Utf8(typed), names_);
+  if (paths.empty()) return;
+  const int count = static_cast<int>(paths.size());
+  const auto shown = std::ranges::find(paths, Utf8(edit_->GetValue()));
+  const int place = shown == paths.end() ? 0 : (static_cast<int>(shown - paths.begin()) + step + count) % count;
+  edit_->ChangeValue(wxString::FromUTF8(paths[static_cast<size_t>(place)]));
+  edit_->SetSelection(static_cast<long>(typed.length()), -1);
+}
+
+void PathBar::ShowEdit(bool show) {
+  if (edit_->IsShown() == show) return;
+  crumbs_->Show(!show);
+  edit_->Show(show);
+  Layout();
 }
 
 void PathBar::TakeTyped() {
-  std::string folder = Utf8(path_->GetValue());
-  if (folder.starts_with('~')) folder.replace(0, 1, Utf8(wxGetHomeDir()));
-  folder = platform::AbsolutePath(folder);
+  if (!platform::IsFolder(FolderTyped(Utf8(edit_->GetValue())))) ShowCompletion(0);
+  const std::string folder = FolderTyped(Utf8(edit_->GetValue()));
   if (!platform::IsFolder(folder)) return wxBell();
+  ShowEdit(false);
   events_.open(folder);
+}
+
+// The nearest first.
+void PathBar::OfferSteps(wxWindow& button, int direction) {
+  std::vector<Crumb> folders;
+  for (int steps = direction; trail_.CanStep(steps); steps += direction) {
+    folders.push_back({trail_.FolderAt(steps), trail_.FolderAt(steps)});
+  }
+  const auto chosen = ChooseFolderFromMenu(button, folders, {});
+  if (chosen) events_.step(direction * (static_cast<int>(*chosen) + 1));
+}
+
+// The latest first, the one that is shown marked.
+void PathBar::OfferTrail() {
+  int last = 0;
+  while (trail_.CanStep(last + 1)) ++last;
+  std::vector<Crumb> folders;
+  for (int steps = last; trail_.CanStep(steps); --steps) folders.push_back({trail_.FolderAt(steps), trail_.FolderAt(steps)});
+  const auto chosen = ChooseFolderFromMenu(*back_, folders, folder_);
+  if (chosen && last != static_cast<int>(*chosen)) events_.step(last - static_cast<int>(*chosen));
 }
 
 }  // namespace fotomill::desktop
