@@ -1,6 +1,7 @@
 #include "cli/libraries.h"
 
 #include <jconfig.h>
+#include <lcms2.h>
 #include <libdeflate.h>
 #include <png.h>
 #include <tiffio.h>
@@ -34,6 +35,9 @@ std::string WebpVersion() {
   return std::to_string(version >> 16) + "." + std::to_string(version >> 8 & 255) + "." + std::to_string(version & 255);
 }
 
+// 2140 stands for 2.14.
+std::string LcmsVersion() { return std::to_string(LCMS_VERSION / 1000) + "." + std::to_string(LCMS_VERSION % 1000 / 10); }
+
 std::vector<Library> MakeLibraries() {
   return {
       {"CLI11", CLI11_VERSION, "the command line"},
@@ -46,6 +50,7 @@ std::vector<Library> MakeLibraries() {
       {"libdeflate", LIBDEFLATE_VERSION_STRING, "PNG and TIFF"},
       {"libtiff", TiffVersion(), "TIFF"},
       {"libwebp", WebpVersion(), "WebP"},
+      {"lcms2", LcmsVersion(), "color profiles, in the desktop program"},
       {"libjxr", HdpWorksHere() ? "present" : "missing", "HD Photo, loaded when needed"},
   };
 }

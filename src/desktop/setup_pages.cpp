@@ -48,6 +48,7 @@ constexpr SetupItem kItems[] = {
     {Viewing,    "Size",               OptimumZoomNoUpsize,            "Fitting never enlarges"},
     {Viewing,    "Size",               ResizeFilter,                   "Filter for scaling"},
     {Viewing,    "Picture",            ExifAdjustOrientation,          "Turn pictures upright as the camera says"},
+    {Viewing,    "Picture",            ViewModeColorProfiles,          "Follow the color profiles of pictures"},
     {Viewing,    "Picture",            UseAlphaChannels,               "Read transparency of bitmaps (BMP)"},
     {Viewing,    "Picture",            RecognizeAPNG,                  "Recognize animated PNG files"},
     {Viewing,    "Window",             ViewModeBackground,             "Color behind the picture"},

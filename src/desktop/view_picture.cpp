@@ -7,6 +7,7 @@
 #include "core/settings.h"
 #include "picture/registry.h"
 #include "platform/clock.h"
+#include "processing/colour_transform.h"
 #include "processing/pixel_rows.h"
 #include "processing/scale.h"
 
@@ -31,6 +32,8 @@ Status LoadInto(const ViewWish& wish, ViewPicture& view) {
   RETURN_IF_BAD(LoadPictureInfo(wish.path.c_str(), picture));
   picture->page = wish.page;
   RETURN_IF_BAD(ReadPicture(*picture));
+  // Before the background joins in, whose colour is the screen's.
+  if (wish.look.profiles && !picture->metadata.icc.empty()) ColourTransform(picture->metadata.icc).Apply(picture->image);
   RETURN_IF_BAD(PrepareForDisplay(*picture, static_cast<Color>(settings.ViewModeBackground)));
   ViewTransform fit;
   fit.SetPicture(picture->image.Width(), picture->image.Height());
@@ -43,6 +46,8 @@ Status LoadInto(const ViewWish& wish, ViewPicture& view) {
 }
 
 }  // namespace
+
+ViewLook ViewLook::FromSettings() { return {settings.ViewModeColorProfiles != 0}; }
 
 uint64_t ViewPicture::Bytes() const {
   return kRecordBytes + fitted.Bytes().size() + (picture == nullptr ? 0 : picture->image.Bytes().size());

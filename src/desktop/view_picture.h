@@ -15,13 +15,22 @@
 
 namespace fotomill::desktop {
 
+// How a picture is to look, whichever it is.
+struct ViewLook {
+  bool profiles = false;  // in the colours that its colour profile means
+
+  static ViewLook FromSettings();
+  bool operator==(const ViewLook&) const = default;
+};
+
 // A picture as a view window wants it: a page of a file, with the size of the window that it is to fit.
 struct ViewWish {
   std::string path;
   int32_t page = 0;
   int32_t fitWidth = 0, fitHeight = 0;  // device pixels, 0 for none
+  ViewLook look = ViewLook::FromSettings();
 
-  bool SamePicture(const ViewWish& other) const { return path == other.path && page == other.page; }
+  bool SamePicture(const ViewWish& other) const { return path == other.path && page == other.page && look == other.look; }
 };
 
 // A decoded picture: upright, 24 bits, without alpha.

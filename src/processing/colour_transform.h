@@ -1,0 +1,41 @@
+#pragma once
+
+#include <array>
+#include <cstdint>
+#include <span>
+
+#include "picture/packed_image.h"
+
+namespace fotomill {
+
+// How the colours of an ICC profile become those of a screen, by the profile's perceptual intent. Profiles of RGB and of
+// grey pictures count; one of another kind, one that is damaged, and one whose colours the screen shows as they are (sRGB,
+// mostly) change nothing.
+class ColourTransform {
+ public:
+  // `source` is the profile of the pictures, `screen` that of the screen, both as files hold them. An empty `screen`, or one
+  // that is of no use, stands for sRGB. Takes from a part of a millisecond to some milliseconds.
+  explicit ColourTransform(std::span<const uint8_t> source, std::span<const uint8_t> screen = {});
+  ~ColourTransform();
+  ColourTransform(const ColourTransform&) = delete;
+  ColourTransform& operator=(const ColourTransform&) = delete;
+
+  bool ChangesColours() const { return transform_ != nullptr; }
+  // Changes the pixels of an image of 24 bits, or the colour table of a smaller one; large images on all cores. A picture in
+  // colours with the profile of a grey one stays as it is. Any number of threads may call this at once.
+  void Apply(PackedImage& image) const;
+
+ private:
+  static constexpr int32_t kGreys = 256;
+
+  void ApplyToColorTable(PackedImage& image) const;
+  void ApplyToRows(PackedImage& image, int32_t first, int32_t end) const;
+  void MapGreys(uint8_t* bgr, int32_t pixels) const;
+  bool ChangesTestColours();
+
+  void* transform_ = nullptr;  // the library's; null where nothing changes
+  bool grey_ = false;          // the profile is one of grey pictures: `greys_` says it all
+  std::array<uint8_t, 3 * kGreys> greys_{};
+};
+
+}  // namespace fotomill
