@@ -6,6 +6,7 @@
 
 #include "core/settings.h"
 #include "metadata/picture_exif.h"
+#include "processing/blend.h"
 #include "processing/flatten.h"
 #include "processing/pixel_rows.h"
 #include "processing/promote.h"
@@ -58,6 +59,17 @@ Status ToRgb(const PackedImage& image, RgbImage& rgb) {
   return Status::Ok;
 }
 
+Status ToRgb(const PackedImage& image, const PackedImage& alpha, Color background, RgbImage& rgb) {
+  RETURN_IF_BAD(ToRgb(image, rgb));
+  for (int32_t y = 0; y < rgb.height && !alpha.Empty(); ++y) {
+    uint8_t* pixel = rgb.Row(y);
+    for (const uint8_t a : alpha.Row(y).first(static_cast<size_t>(rgb.width))) {
+      for (int shift = 0; shift < 24; shift += 8, ++pixel) *pixel = Blend(static_cast<uint8_t>(background >> shift), *pixel, a);
+    }
+  }
+  return Status::Ok;
+}
+
 Status ToPacked(const RgbImage& rgb, PackedImage& image) {
   RETURN_IF_BAD(NewPackedImage(rgb.width, rgb.height, nullptr, 24, image));
   for (int32_t y = 0; y < rgb.height; ++y) SwapColors(rgb.Row(y), static_cast<size_t>(rgb.width), image.Row(y).data());
@@ -70,6 +82,13 @@ Status PrepareForDisplay(PictureRecord& picture, Color background) {
   picture.defaultColour = background;
   picture.alphaFlags &= static_cast<uint8_t>(~kFlattenOnBackground);
   RETURN_IF_BAD(FlattenAlpha(picture));
+  return PromotePicture(picture);
+}
+
+Status PrepareWithAlpha(PictureRecord& picture) {
+  if (picture.image.Empty()) return Status::EmptyImage;
+  if (settings.ExifAdjustOrientation != 0) RETURN_IF_BAD(TurnUpright(picture));
+  if (!picture.alpha.Empty() && IsOpaque(picture.alpha)) picture.alpha.Free();
   return PromotePicture(picture);
 }
 

@@ -26,12 +26,18 @@ RgbImage FilledImage(int32_t width, int32_t height, Color color);
 // The pixels of a packed image of any depth. Statuses as NewPackedImage.
 Status ToRgb(const PackedImage& image, RgbImage& rgb);
 
+// The same with an alpha plane, on a background of one colour, 0x00BBGGRR.
+Status ToRgb(const PackedImage& image, const PackedImage& alpha, Color background, RgbImage& rgb);
+
 // And back: a packed image of 24 bits. Statuses as NewPackedImage.
 Status ToPacked(const RgbImage& rgb, PackedImage& image);
 
 // Turns a picture upright by its EXIF orientation, if ExifAdjustOrientation asks for it, composites its alpha plane onto
 // `background` (0x00BBGGRR) and brings it to 24 bits: what a window can show. Statuses of those steps.
 Status PrepareForDisplay(PictureRecord& picture, Color background);
+
+// The same without a background: the alpha plane stays, unless the picture is opaque after all.
+Status PrepareWithAlpha(PictureRecord& picture);
 
 // The picture of a thumbnail without the even margins of a colour around it, and at least a pixel of it.
 RgbImage WithoutMatte(const RgbImage& image, Color matte);

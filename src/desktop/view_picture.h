@@ -9,15 +9,14 @@
 #include <vector>
 
 #include "core/status.h"
-#include "desktop/rgb_image.h"
-#include "desktop/view_transform.h"
 #include "picture/picture_record.h"
 
 namespace fotomill::desktop {
 
 // How a picture is to look, whichever it is.
 struct ViewLook {
-  bool profiles = false;  // in the colours that its colour profile means
+  bool profiles = false;   // in the colours that its colour profile means
+  bool keepAlpha = false;  // with its alpha plane, instead of on ViewModeBackground
 
   static ViewLook FromSettings();
   bool operator==(const ViewLook&) const = default;
@@ -33,13 +32,19 @@ struct ViewWish {
   bool SamePicture(const ViewWish& other) const { return path == other.path && page == other.page && look == other.look; }
 };
 
-// A decoded picture: upright, 24 bits, without alpha.
+// Pixels of 24 bits with their alpha plane, which is empty where all are opaque.
+struct ViewPixels {
+  PackedImage image, alpha;
+};
+
+// A decoded picture: upright, 24 bits, with an alpha plane only if its look wants it and not all of it is opaque.
 struct ViewPicture {
   ViewWish wish;
   Status status = Status::Ok;
-  PicturePointer picture;  // null unless Ok
-  PackedImage fitted;      // as large as the fit of the wish's window; empty where that is the picture's own size or more
-  double seconds = 0;      // that decoding took
+  PicturePointer picture;          // null unless Ok
+  ViewPixels fitted;               // as large as the fit of the wish's window; empty where that is the picture's own size or more
+  std::vector<std::string> photo;  // what the camera wrote about it, in lines
+  double seconds = 0;              // that decoding took
 
   uint64_t Bytes() const;
 };
@@ -91,7 +96,7 @@ class ViewScaler {
   void Request(ViewPicturePointer picture, int32_t width, int32_t height);
   struct Scaled {
     ViewPicturePointer picture;
-    PackedImage image;
+    ViewPixels pixels;
   };
   // What was finished since the last call, null if nothing.
   std::unique_ptr<Scaled> Take();
@@ -108,10 +113,5 @@ class ViewScaler {
   bool stop_ = false;
   std::thread worker_;
 };
-
-// Draws what a window shows of a picture into `canvas`, whose size is the window's in device pixels: `source`, the picture
-// at any size, in the place that `transform` gives it, the rest in `background`. A source of just the shown size is copied;
-// others are sampled at the nearest pixel, or with `smooth` between pixels.
-void DrawView(const PackedImage& source, const ViewTransform& transform, Color background, bool smooth, RgbImage& canvas);
 
 }  // namespace fotomill::desktop

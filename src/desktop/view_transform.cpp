@@ -23,9 +23,11 @@ double KeptInside(double position, double length, double window) {
 }  // namespace
 
 void ViewTransform::SetPicture(int32_t width, int32_t height) {
+  const ViewPlace place = Place();
   pictureWidth_ = std::max(width, 1);
   pictureHeight_ = std::max(height, 1);
-  Update();
+  ScaleByMode();
+  PutCentre(place.centreX, place.centreY);
 }
 
 void ViewTransform::SetWindow(int32_t width, int32_t height) {
@@ -64,22 +66,52 @@ void ViewTransform::Pan(double dx, double dy) {
   KeepInside();
 }
 
+ViewPlace ViewTransform::Place() const {
+  return {mode_, scale_ / FitScale(), (windowWidth_ / 2.0 - x_) / ShownWidth(), (windowHeight_ / 2.0 - y_) / ShownHeight()};
+}
+
+void ViewTransform::SetPlace(const ViewPlace& place) {
+  mode_ = place.mode;
+  if (mode_ == ZoomMode::Free) scale_ = std::clamp(place.timesFit * FitScale(), kSmallest, kLargest);
+  ScaleByMode();
+  PutCentre(place.centreX, place.centreY);
+}
+
+void ViewTransform::StartAfresh(int32_t zoom) {
+  if (mode_ == ZoomMode::Free) SetModeFromKey(zoom);
+  PutCentre(0.5, 0.5);
+}
+
 int32_t ViewTransform::ShownWidth() const { return std::max(static_cast<int32_t>(std::lround(pictureWidth_ * scale_)), 1); }
 int32_t ViewTransform::ShownHeight() const { return std::max(static_cast<int32_t>(std::lround(pictureHeight_ * scale_)), 1); }
 int32_t ViewTransform::X() const { return static_cast<int32_t>(std::floor(x_)); }
 int32_t ViewTransform::Y() const { return static_cast<int32_t>(std::floor(y_)); }
 
-void ViewTransform::Update() {
-  const double before = scale_;
+double ViewTransform::FitScale() const {
+  return std::min(static_cast<double>(windowWidth_) / pictureWidth_, static_cast<double>(windowHeight_) / pictureHeight_);
+}
+
+void ViewTransform::ScaleByMode() {
   const double across = static_cast<double>(windowWidth_) / pictureWidth_;
   const double down = static_cast<double>(windowHeight_) / pictureHeight_;
-  if (mode_ == ZoomMode::Fit) scale_ = std::min(across, down);
+  if (mode_ == ZoomMode::Fit) scale_ = FitScale();
   if (mode_ == ZoomMode::FitWidth) scale_ = across;
   if (mode_ == ZoomMode::Fill) scale_ = std::max(across, down);
   if (mode_ == ZoomMode::Fit && settings.OptimumZoomNoUpsize != 0) scale_ = std::min(scale_, 1.0);
-  // What was in the middle of the window stays there.
+}
+
+// What was in the middle of the window stays there.
+void ViewTransform::Update() {
+  const double before = scale_;
+  ScaleByMode();
   x_ = windowWidth_ / 2.0 - (windowWidth_ / 2.0 - x_) * scale_ / before;
   y_ = windowHeight_ / 2.0 - (windowHeight_ / 2.0 - y_) * scale_ / before;
+  KeepInside();
+}
+
+void ViewTransform::PutCentre(double x, double y) {
+  x_ = windowWidth_ / 2.0 - x * ShownWidth();
+  y_ = windowHeight_ / 2.0 - y * ShownHeight();
   KeepInside();
 }
 

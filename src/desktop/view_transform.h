@@ -6,6 +6,13 @@ namespace fotomill::desktop {
 
 enum class ZoomMode { Fit, FitWidth, Fill, Free };
 
+// Zoom and place in relation to a picture and a window, so that they mean the same for others.
+struct ViewPlace {
+  ZoomMode mode = ZoomMode::Fit;
+  double timesFit = 1;                  // the scale as a multiple of that which fits the window
+  double centreX = 0.5, centreY = 0.5;  // what is in the middle of the window, in parts of the picture
+};
+
 // Where a picture lies in a view window and how large: pure arithmetic in device pixels. A scale of 1 shows each pixel of
 // the picture as one pixel of the screen.
 class ViewTransform {
@@ -13,6 +20,7 @@ class ViewTransform {
   static constexpr double kStep = 1.25;  // of zooming in and out
   static constexpr double kSmallest = 0.01, kLargest = 64;
 
+  // Another picture at the same zoom, and at the same place in parts of it.
   void SetPicture(int32_t width, int32_t height);
   void SetWindow(int32_t width, int32_t height);
   void SetMode(ZoomMode mode);
@@ -24,6 +32,10 @@ class ViewTransform {
   // To the scale in the middle of the window.
   void ZoomToMiddle(double scale) { ZoomTo(scale, windowWidth_ / 2.0, windowHeight_ / 2.0); }
   void Pan(double dx, double dy);
+  ViewPlace Place() const;
+  void SetPlace(const ViewPlace& place);
+  // To the middle; a zoom of its own gives way to what the key stands for, fitting stays.
+  void StartAfresh(int32_t zoom);
 
   ZoomMode Mode() const { return mode_; }
   double Scale() const { return scale_; }
@@ -36,7 +48,10 @@ class ViewTransform {
   bool CanPan() const { return ShownWidth() > windowWidth_ || ShownHeight() > windowHeight_; }
 
  private:
+  double FitScale() const;
+  void ScaleByMode();
   void Update();
+  void PutCentre(double x, double y);
   void KeepInside();
 
   int32_t pictureWidth_ = 1, pictureHeight_ = 1;

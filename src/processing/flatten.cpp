@@ -30,6 +30,8 @@ void BlendBlock(uint8_t* bgr, const uint8_t* alpha, int32_t pixels, const Backgr
   for (int32_t i = 0; i < 3 * pixels; ++i) bgr[i] = Blend(background.bgr[i], bgr[i], spread[i]);
 }
 
+}  // namespace
+
 bool IsOpaque(const PackedImage& alpha) {
   for (int32_t r = 0; r < alpha.Height(); ++r) {
     const auto row = alpha.StoredRow(r).first(static_cast<size_t>(alpha.Width()));
@@ -37,8 +39,6 @@ bool IsOpaque(const PackedImage& alpha) {
   }
   return true;
 }
-
-}  // namespace
 
 Status FlattenAlpha(PictureRecord& picture) {
   if (picture.alpha.Empty()) return Status::Ok;

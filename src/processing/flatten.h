@@ -12,4 +12,7 @@ namespace fotomill {
 // pictures only, leaves it unchanged or, still with its plane, at 24 bits.
 Status FlattenAlpha(PictureRecord& picture);
 
+// Whether an alpha plane has nothing but 255.
+bool IsOpaque(const PackedImage& alpha);
+
 }  // namespace fotomill

@@ -1,12 +1,18 @@
 #include <gtest/gtest.h>
+#include <lcms2.h>
 
 #include <atomic>
 #include <condition_variable>
+#include <cstring>
 
 #include "core/choice_lists.h"
+#include "desktop/photo_facts.h"
 #include "desktop/thumbnail_loader.h"
+#include "desktop/view_drawing.h"
 #include "desktop/view_picture.h"
 #include "desktop/view_transform.h"
+#include "picture/registry.h"
+#include "support/exif_blocks.h"
 #include "support/files.h"
 
 namespace fotomill::desktop {
@@ -31,6 +37,23 @@ TEST(ViewTransform, FitsAndZoomsAtThePointer) {
   EXPECT_EQ(view.Y(), 200 - 800);
   view.ZoomTo(0.00001, 0, 0);
   EXPECT_EQ(view.ShownWidth(), 4);
+  // The same part of another picture, in parts of it; in another window at as many times its fit.
+  view.SetPicture(800, 400);
+  view.ZoomTo(1, 100, 100);
+  view.Pan(-100, -30);
+  view.SetPicture(1600, 800);
+  EXPECT_EQ(view.Scale(), 1);
+  const ViewPlace place = view.Place();
+  ViewTransform other;
+  other.SetPicture(1600, 800);
+  other.SetWindow(400, 400);
+  other.SetPlace(place);
+  EXPECT_EQ(other.Scale(), 2);
+  EXPECT_EQ(other.X() - 200, 2 * (view.X() - 100));
+  EXPECT_EQ(other.Y() - 200, 2 * (view.Y() - 100));
+  other.StartAfresh(choice::kZoomFill);
+  EXPECT_EQ(other.Scale(), 0.5);
+  EXPECT_EQ(other.X(), -200);
   // A small picture is not enlarged to fit, unless that is asked for.
   view.SetPicture(10, 10);
   view.SetMode(ZoomMode::Fit);
@@ -55,25 +78,111 @@ std::vector<int> Greens(const RgbImage& canvas, int32_t y) {
 
 TEST(DrawView, PlacesCopiesAndSamples) {
   const PackedImage image = Ramp(2, 2);  // greens 1 4 / 41 44
+  const PackedImage opaque;
+  const ViewSource source{image, opaque};
+  const Backdrop plain{.around = 0x00ff00};
   RgbImage canvas = FilledImage(6, 4, 0);
   ViewTransform view;
   view.SetPicture(2, 2);
   view.SetWindow(6, 4);
-  DrawView(image, view, 0x00ff00, true, canvas);
+  DrawView(source, view, plain, true, canvas);
   EXPECT_EQ(Greens(canvas, 0), (std::vector<int>{255, 255, 255, 255, 255, 255}));
   EXPECT_EQ(Greens(canvas, 1), (std::vector<int>{255, 255, 1, 4, 255, 255}));
   EXPECT_EQ(canvas.Row(1)[6], 2);  // red comes first
   view.ZoomToMiddle(2);
-  DrawView(image, view, 0x00ff00, false, canvas);
+  DrawView(source, view, plain, false, canvas);
   EXPECT_EQ(Greens(canvas, 0), (std::vector<int>{255, 1, 1, 4, 4, 255}));
   EXPECT_EQ(Greens(canvas, 2), (std::vector<int>{255, 41, 41, 44, 44, 255}));
-  DrawView(image, view, 0x00ff00, true, canvas);
+  DrawView(source, view, plain, true, canvas);
   EXPECT_EQ(Greens(canvas, 0), (std::vector<int>{255, 1, 2, 3, 4, 255}));
   // Far zoomed in and panned to the end, nothing is read beyond the picture.
   view.ZoomTo(64, 0, 0);
   view.Pan(-1000, -1000);
-  DrawView(image, view, 0, true, canvas);
+  DrawView(source, view, plain, true, canvas);
   EXPECT_EQ(Greens(canvas, 3), (std::vector<int>(6, 44)));
+}
+
+TEST(DrawView, SquaresShowThroughAndStayInPlace) {
+  const PackedImage image = Ramp(4, 2);  // greens 1 4 7 10 / 41 44 47 50
+  PackedImage alpha;
+  ASSERT_EQ(NewAlphaPlane(4, 2, alpha), Status::Ok);
+  alpha.Row(0)[3] = 255;
+  alpha.Row(1)[0] = 128;
+  const ViewSource source{image, alpha};
+  const Backdrop squares{.around = 0x00ff00, .squares = true, .square = {0x006400, 0x00c800}, .side = 2};
+  RgbImage canvas = FilledImage(6, 4, 0);
+  ViewTransform view;
+  view.SetPicture(4, 2);
+  view.SetWindow(6, 4);
+  DrawView(source, view, squares, true, canvas);
+  EXPECT_EQ(Greens(canvas, 1), (std::vector<int>{255, 100, 200, 200, 10, 255}));
+  EXPECT_EQ(Greens(canvas, 2), (std::vector<int>{255, (200 * 127 + 41 * 128 + 127) / 255, 100, 100, 200, 255}));
+  view.ZoomToMiddle(2);
+  view.Pan(-1, 0);
+  DrawView(source, view, squares, false, canvas);
+  EXPECT_EQ(Greens(canvas, 0), (std::vector<int>{100, 100, 200, 200, 10, 10}));
+  // Between pixels, what is transparent gives no colour away: from 10 to the square behind without a shade of 7.
+  view.ZoomTo(4, 0, 0);
+  view.Pan(-100, 0);
+  DrawView(source, view, {.around = 0x000a00}, true, canvas);
+  EXPECT_EQ(Greens(canvas, 0), (std::vector<int>(6, 10)));
+}
+
+TEST(ViewPicture, FollowsItsProfileAndKeepsItsAlpha) {
+  const test::TemporaryFolder folder;
+  const std::string path = folder.Path("a.png");
+  PicturePointer picture = NewPictureRecord();
+  picture->image = Ramp(8, 8);
+  picture->width = picture->height = 8;
+  picture->bitsPerPixel = 24;
+  ASSERT_EQ(NewAlphaPlane(8, 8, picture->alpha), Status::Ok);
+  picture->alphaFlags = kHasAlpha;
+  cmsToneCurve* const linear = cmsBuildGamma(nullptr, 1);
+  cmsToneCurve* const curves[] = {linear, linear, linear};
+  const cmsCIExyY white = {0.3127, 0.3290, 1};
+  const cmsCIExyYTRIPLE primaries = {{0.64, 0.33, 1}, {0.3, 0.6, 1}, {0.15, 0.06, 1}};
+  const cmsHPROFILE profile = cmsCreateRGBProfile(&white, &primaries, curves);
+  cmsUInt32Number size = 0;
+  cmsSaveProfileToMem(profile, nullptr, &size);
+  picture->metadata.icc.resize(size);
+  cmsSaveProfileToMem(profile, picture->metadata.icc.data(), &size);
+  cmsCloseProfile(profile);
+  cmsFreeToneCurve(linear);
+  ASSERT_EQ(WritePicture(*picture, path, {}), Status::Ok);
+
+  ViewWish wish{path, 0, 4, 4, {.profiles = true, .keepAlpha = true}};
+  const ViewPicturePointer managed = LoadViewPicture(wish);
+  ASSERT_EQ(managed->status, Status::Ok);
+  EXPECT_EQ(managed->picture->image.Row(1)[0], 110);  // 40 of light, as sRGB writes it
+  EXPECT_EQ(managed->picture->alpha.Width(), 8);
+  EXPECT_EQ(managed->fitted.alpha.Width(), 4);
+  wish.look = {};
+  const ViewPicturePointer plain = LoadViewPicture(wish);
+  EXPECT_EQ(plain->picture->image.Row(1)[0], 0xc0);  // the background, since all is transparent
+  EXPECT_TRUE(plain->picture->alpha.Empty());
+  EXPECT_GT(managed->Bytes(), plain->Bytes());
+}
+
+TEST(PhotoFacts, TellWhatPhotographersAsk) {
+  const std::vector<std::string> little = {"Acme", "1/60 s"};
+  EXPECT_EQ(PhotoFacts(test::BigEndianBlock()), little);
+  EXPECT_EQ(PhotoFacts(test::LittleEndianBlock()), little);
+  test::BlockBuilder builder;
+  const auto text = [&](const char* words) { return builder.Bytes({words, words + std::strlen(words) + 1}); };
+  const uint32_t make = text("ACME CORPORATION"), model = text("ACME 5D  "), lens = text("24-70mm"),
+                 date = text("2001:05:19 18:36:41");
+  const uint32_t exposure = builder.Bytes({5, 0, 0, 0, 2, 0, 0, 0}), aperture = builder.Bytes({28, 0, 0, 0, 10, 0, 0, 0}),
+                 length = builder.Bytes({50, 0, 0, 0, 0, 0, 0, 0});  // by nothing
+  builder.Patch32(4, builder.Directory({{0x010f, 2, 17, make},
+                                        {0x0110, 2, 10, model},
+                                        {0x829a, 5, 1, exposure},
+                                        {0x829d, 5, 1, aperture},
+                                        {0x8827, 3, 1, 400},
+                                        {0x9003, 2, 20, date},
+                                        {0x920a, 5, 1, length},
+                                        {0xa434, 2, 8, lens}}));
+  EXPECT_EQ(PhotoFacts(builder.block),
+            (std::vector<std::string>{"ACME 5D", "24-70mm", "2.5 s   f/2.8   ISO 400", "2001-05-19 18:36:41"}));
 }
 
 TEST(Thumbnail, MatteIsCutOff) {

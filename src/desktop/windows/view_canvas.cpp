@@ -1,7 +1,9 @@
 #include "desktop/windows/view_canvas.h"
 
 #include <wx/dcclient.h>
+#include <wx/settings.h>
 
+#include <algorithm>
 #include <cmath>
 
 #include "core/choice_lists.h"
@@ -17,6 +19,9 @@ namespace {
 
 constexpr int kPanSteps = 8;          // across the window
 constexpr double kPlainPixelsAt = 2;  // from this zoom on pixels are squares
+constexpr int kSquareSide = 8;        // of the checkerboard
+constexpr Color kLightSquares[] = {0xffffff, 0xcccccc};
+constexpr Color kDarkSquares[] = {0x666666, 0x444444};
 
 wxColour ColourOf(int32_t color) {
   return {static_cast<unsigned char>(color), static_cast<unsigned char>(color >> 8), static_cast<unsigned char>(color >> 16)};
@@ -55,6 +60,10 @@ void ViewCanvas::ShowStandIn(PackedImage image, int32_t width, int32_t height) {
   Refresh();
 }
 
+void ViewCanvas::StartAfresh() {
+  if (settings.ViewModeKeepZoom == 0) transform_.StartAfresh(settings.DefaultViewZoom);
+}
+
 void ViewCanvas::SetOverlay(const std::string& text) {
   if (text == overlay_) return;
   overlay_ = text;
@@ -88,7 +97,7 @@ void ViewCanvas::PanBy(int stepsAcross, int stepsDown) {
 // The picture is drawn at once from what there is; a smaller scale then gets pixels that are made for it.
 void ViewCanvas::TransformChanged() {
   if (standIn_.Empty() && Showable() && transform_.Scale() < 1) {
-    const PackedImage& source = BestSource();
+    const PackedImage& source = BestSource().image;
     const bool exact = source.Width() == transform_.ShownWidth() && source.Height() == transform_.ShownHeight();
     if (!exact) scaler_->Request(picture_, transform_.ShownWidth(), transform_.ShownHeight());
   }
@@ -103,13 +112,13 @@ void ViewCanvas::ScaledCame() {
   Refresh();
 }
 
-const PackedImage& ViewCanvas::BestSource() const {
-  const auto fits = [this](const PackedImage& image) {
-    return image.Width() == transform_.ShownWidth() && image.Height() == transform_.ShownHeight();
+ViewSource ViewCanvas::BestSource() const {
+  const auto fits = [this](const ViewPixels& pixels) {
+    return pixels.image.Width() == transform_.ShownWidth() && pixels.image.Height() == transform_.ShownHeight();
   };
-  if (fits(picture_->fitted)) return picture_->fitted;
-  if (scaled_ != nullptr && fits(scaled_->image)) return scaled_->image;
-  return picture_->picture->image;
+  if (fits(picture_->fitted)) return {picture_->fitted.image, picture_->fitted.alpha};
+  if (scaled_ != nullptr && fits(scaled_->pixels)) return {scaled_->pixels.image, scaled_->pixels.alpha};
+  return {picture_->picture->image, picture_->picture->alpha};
 }
 
 // --- painting ---
@@ -133,9 +142,19 @@ void ViewCanvas::PaintPicture(wxDC& dc) {
   pixels.height = size.y;
   pixels.bytes.resize(static_cast<size_t>(size.x) * static_cast<size_t>(size.y) * 3);
   const bool smooth = transform_.Scale() < kPlainPixelsAt && ScaleFilterFromKey(settings.ResizeFilter) != ScaleFilter::Nearest;
-  DrawView(standIn_.Empty() ? BestSource() : standIn_, transform_, static_cast<Color>(settings.ViewModeBackground), smooth,
-           pixels);
+  const PackedImage opaque;
+  const ViewSource source = standIn_.Empty() ? BestSource() : ViewSource{standIn_, opaque};
+  DrawView(source, transform_, BackdropHere(), smooth, pixels);
   dc.DrawBitmap(BitmapOf(pixels, GetContentScaleFactor()), 0, 0);
+}
+
+Backdrop ViewCanvas::BackdropHere() const {
+  Backdrop backdrop{.around = static_cast<Color>(settings.ViewModeBackground)};
+  const bool dark = wxSystemSettings::GetAppearance().IsDark();
+  backdrop.squares = settings.ViewModeCheckerboard != 0;
+  std::ranges::copy(dark ? kDarkSquares : kLightSquares, backdrop.square);
+  backdrop.side = std::max(static_cast<int>(std::lround(FromDIP(kSquareSide) * GetContentScaleFactor())), 1);
+  return backdrop;
 }
 
 void ViewCanvas::PaintMessage(wxDC& dc) const {

@@ -6,6 +6,7 @@
 #include <memory>
 #include <string>
 
+#include "desktop/view_drawing.h"
 #include "desktop/view_picture.h"
 #include "desktop/view_transform.h"
 
@@ -30,6 +31,8 @@ class ViewCanvas : public wxWindow {
   // An image that stands in for a picture of `width` by `height` until that comes.
   void ShowStandIn(PackedImage image, int32_t width, int32_t height);
   const ViewPicturePointer& Picture() const { return picture_; }
+  // The next picture is another one: it is shown as pictures open, unless ViewModeKeepZoom keeps zoom and place.
+  void StartAfresh();
   // Lines on top of the picture; empty for none.
   void SetOverlay(const std::string& text);
 
@@ -60,7 +63,8 @@ class ViewCanvas : public wxWindow {
   void TransformChanged();
   void ScaledCame();
   bool Showable() const { return picture_ != nullptr && picture_->picture != nullptr; }
-  const PackedImage& BestSource() const;
+  ViewSource BestSource() const;
+  Backdrop BackdropHere() const;
 
   const Events events_;
   ViewPicturePointer picture_;

@@ -4,6 +4,7 @@
 
 #include <algorithm>
 
+#include "core/settings.h"
 #include "desktop/windows/view_frame.h"
 
 namespace fotomill::desktop {
@@ -30,6 +31,16 @@ template <void (ViewCanvas::*action)()>
 void OfCanvas(ViewFrame& view) {
   (view.Canvas().*action)();
 }
+// A setting that is on or off.
+template <int32_t Settings::*setting>
+void Switch(ViewFrame& view) {
+  settings.*setting = settings.*setting == 0 ? 1 : 0;
+  view.SettingSwitched();
+}
+template <int32_t Settings::*setting>
+bool IsOn() {
+  return settings.*setting != 0;
+}
 void First(ViewFrame& view) { view.GoTo(0); }
 void Last(ViewFrame& view) { view.GoTo(view.LastPlace()); }
 
@@ -46,6 +57,7 @@ constexpr ViewCommand kCommands[] = {
     {"&Actual size",      "1",         {'1', WXK_NUMPAD1},              OfCanvas<&ViewCanvas::ZoomActual>},
     {"Fit to wi&dth",     "2",         {'2', WXK_NUMPAD2},              Zoom<ZoomMode::FitWidth>},
     {"Fi&ll the window",  "3",         {'3', WXK_NUMPAD3},              Zoom<ZoomMode::Fill>},
+    {"&Keep zoom and place between pictures", "K", {'K'},               Switch<&Settings::ViewModeKeepZoom>, IsOn<&Settings::ViewModeKeepZoom>},
     {nullptr, nullptr, {}, nullptr},
     {"Next pa&ge",        "]",         {']'},                           StepPage<1>},
     {"Pre&vious page",    "[",         {'['},                           StepPage<-1>},
@@ -53,6 +65,8 @@ constexpr ViewCommand kCommands[] = {
     {"Full &screen",      "F11",       {WXK_F11, 'F'},                  Of<&ViewFrame::ToggleFullScreen>},
     {"Slides&how",        "S",         {'S', WXK_F8},                   Of<&ViewFrame::ToggleSlideshow>},
     {"In&formation",      "I",         {'I'},                           Of<&ViewFrame::ToggleOverlay>},
+    {"Colors of the pro&file", "M",    {'M'},                           Switch<&Settings::ViewModeColorProfiles>, IsOn<&Settings::ViewModeColorProfiles>},
+    {"Check&erboard behind transparency", "B", {'B'},                   Switch<&Settings::ViewModeCheckerboard>, IsOn<&Settings::ViewModeCheckerboard>},
     {"G&et info...",      "Alt+Enter", {},                              Of<&ViewFrame::ShowInfoWindow>},
     {nullptr, nullptr, {}, nullptr},
     {"&Delete",           "Del",       {WXK_DELETE},                    Of<&ViewFrame::DeleteFile>},

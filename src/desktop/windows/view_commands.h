@@ -14,6 +14,7 @@ struct ViewCommand {
   const char* shownKey;  // beside the text
   int keys[kMostKeys];   // WXK_* or characters; 0 ends them
   void (*run)(ViewFrame& view);
+  bool (*checked)() = nullptr;  // whether its menu item has a mark; null for one that never has
 };
 
 std::span<const ViewCommand> ViewCommands();

@@ -9,9 +9,11 @@
 
 #include "catalog/file_history.h"
 #include "core/choice_lists.h"
+#include "core/configuration.h"
 #include "core/settings.h"
 #include "core/text.h"
 #include "desktop/event_log.h"
+#include "desktop/rgb_image.h"
 #include "desktop/windows/bitmaps.h"
 #include "desktop/windows/file_actions.h"
 #include "desktop/windows/info_frame.h"
@@ -86,6 +88,7 @@ void ViewFrame::GoTo(size_t place) {
   if (place >= list_.size() || (place == place_ && page_ == 0 && canvas_->Picture() != nullptr)) return;
   place_ = place;
   page_ = 0;
+  canvas_->StartAfresh();
   ShowPlace();
 }
 
@@ -99,14 +102,18 @@ void ViewFrame::StepPage(int pages) {
 }
 
 void ViewFrame::ShowPlace() {
+  if (AskForPicture()) return;
+  ShowStandIn();
+  ViewChanged();
+}
+
+// Whether the picture was there already, and is shown.
+bool ViewFrame::AskForPicture() {
   keyTime_ = platform::MonotonicSeconds();
   WantPictures();
-  if (const ViewPicturePointer ready = loader_->Find(WishOf(place_))) {
-    TakePicture(ready);
-  } else {
-    ShowStandIn();
-    ViewChanged();
-  }
+  const ViewPicturePointer ready = loader_->Find(WishOf(place_));
+  if (ready != nullptr) TakePicture(ready);
+  return ready != nullptr;
 }
 
 // Until the picture is there its thumbnail stands in, where the browser has one.
@@ -177,6 +184,16 @@ std::string ViewFrame::StatusLine() const {
   return line;
 }
 
+// Name, what the status bar tells, what the camera wrote.
+std::string ViewFrame::OverlayText() const {
+  std::string text(platform::FileNameOf(list_[place_]));
+  text += "\n" + StatusLine();
+  const ViewPicturePointer& shown = canvas_->Picture();
+  if (!IsCurrent(shown)) return text;
+  for (const std::string& line : shown->photo) text += "\n" + line;
+  return text;
+}
+
 void ViewFrame::ViewChanged() {
   if (canvas_ == nullptr || GetStatusBar() == nullptr) return;  // still being made
   const std::string line = StatusLine();
@@ -184,7 +201,7 @@ void ViewFrame::ViewChanged() {
   SetTitle(name + " - View");
   SetStatusText(Shown(line));
   TellScreenReader(*canvas_, name, Shown(line));
-  canvas_->SetOverlay(overlay_ ? line : std::string());
+  canvas_->SetOverlay(overlay_ ? OverlayText() : std::string());
 }
 
 void ViewFrame::ToggleFullScreen() {
@@ -208,6 +225,14 @@ void ViewFrame::ShowInfoWindow() { (new InfoFrame(frame_, this, {list_[place_]})
 void ViewFrame::ToggleOverlay() {
   overlay_ = !overlay_;
   ViewChanged();
+}
+
+void ViewFrame::SettingSwitched() {
+  (void)SaveConfiguration();
+  LogEvent("view-look", "profiles=" + std::to_string(settings.ViewModeColorProfiles) +
+                            " checkerboard=" + std::to_string(settings.ViewModeCheckerboard) +
+                            " keepzoom=" + std::to_string(settings.ViewModeKeepZoom));
+  if (!IsCurrent(canvas_->Picture()) && !AskForPicture()) ViewChanged();
 }
 
 void ViewFrame::Leave() {
@@ -234,6 +259,7 @@ void ViewFrame::DeleteFile() {
   }
   place_ = std::min(place_, list_.size() - 1);
   page_ = 0;
+  canvas_->StartAfresh();
   ShowPlace();
 }
 
@@ -241,7 +267,9 @@ void ViewFrame::CopyPicture() {
   const ViewPicturePointer& shown = canvas_->Picture();
   if (shown == nullptr || shown->picture == nullptr) return;
   RgbImage pixels;
-  if (ToRgb(shown->picture->image, pixels) != Status::Ok) return wxBell();
+  const PictureRecord& picture = *shown->picture;
+  const auto background = static_cast<Color>(settings.ViewModeBackground);
+  if (ToRgb(picture.image, picture.alpha, background, pixels) != Status::Ok) return wxBell();
   const wxClipboardLocker clipboard;
   if (!clipboard || !wxTheClipboard->SetData(new wxBitmapDataObject(BitmapOf(pixels)))) return wxBell();
   SetStatusText("The picture is on the clipboard.");
@@ -283,7 +311,12 @@ void ViewFrame::ShowMenu(const wxPoint& place) {
       continue;
     }
     // The key is shown beside the text only: keys are the canvas's.
-    menu.Append(++id, wxString(command.text) + "    " + command.shownKey);
+    const wxString text = wxString(command.text) + "    " + command.shownKey;
+    if (command.checked == nullptr) {
+      menu.Append(++id, text);
+    } else {
+      menu.AppendCheckItem(++id, text)->Check(command.checked());
+    }
     menu.Bind(
         wxEVT_MENU, [this, run = command.run](wxCommandEvent&) { run(*this); }, id);
   }

@@ -27,7 +27,8 @@ class ViewFrame : public wxFrame {
   void ToggleFullScreen();
   void ToggleSlideshow();
   void ToggleOverlay();
-  void Leave();  // full screen first, then the window
+  void SettingSwitched();  // one that says how pictures look or stay
+  void Leave();            // full screen first, then the window
   void CopyPicture();
   void DeleteFile();  // to the trash; the next one is shown
   void ShowInfoWindow();
@@ -36,6 +37,7 @@ class ViewFrame : public wxFrame {
 
  private:
   void ShowPlace();
+  bool AskForPicture();
   void ShowStandIn();
   void WantPictures();
   void PictureCame();
@@ -44,6 +46,7 @@ class ViewFrame : public wxFrame {
   ViewWish WishOf(size_t place) const;
   bool IsCurrent(const ViewPicturePointer& picture) const;
   std::string StatusLine() const;
+  std::string OverlayText() const;
   void HidePointerLater();
   void OnKey(wxKeyEvent& event);
   bool PanByKey(int key);

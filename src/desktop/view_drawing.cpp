@@ -1,0 +1,169 @@
+#include "desktop/view_drawing.h"
+
+#include <algorithm>
+#include <array>
+#include <vector>
+
+#include "processing/blend.h"
+#include "processing/pixel_rows.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+// Positions are in 1/65536 of a source pixel.
+using Positions = std::vector<int64_t>;
+
+// The source position for each of the shown pixels from `first` on.
+Positions PositionsOf(int32_t first, int32_t count, int32_t shown, int32_t size, bool between) {
+  Positions positions(static_cast<size_t>(count));
+  const double step = static_cast<double>(size) / shown;
+  const double last = size - (between ? 1.0 : 1.0 / 65536);
+  for (int32_t i = 0; i < count; ++i) {
+    const double position = (first + i + 0.5) * step - (between ? 0.5 : 0);
+    positions[static_cast<size_t>(i)] = static_cast<int64_t>(std::clamp(position, 0.0, last) * 65536);
+  }
+  return positions;
+}
+
+// Two rows of a picture, and where between them a line is.
+struct RowPair {
+  const uint8_t *upper, *lower;
+  int32_t v;  // parts of 256 that are of the lower row
+
+  RowPair(const PackedImage& image, int64_t row)
+      : upper(image.Row(static_cast<int32_t>(row >> 16)).data()),
+        lower(image.Row(std::min(static_cast<int32_t>(row >> 16) + 1, image.Height() - 1)).data()),
+        v(static_cast<int32_t>(row & 0xffff) >> 8) {}
+};
+
+// The columns beside a position, and the parts of 256 that are of the right one.
+struct ColumnPair {
+  int32_t left, right, u;
+
+  ColumnPair(int64_t column, int32_t width)
+      : left(static_cast<int32_t>(column >> 16)),
+        right(std::min(left + 1, width - 1)),
+        u(static_cast<int32_t>(column & 0xffff) >> 8) {}
+};
+
+inline uint8_t* DrawPixelBetween(const RowPair& rows, const ColumnPair& at, uint8_t* rgb) {
+  for (int32_t channel = 2; channel >= 0; --channel) {
+    const int32_t left = 3 * at.left + channel, right = 3 * at.right + channel;
+    const int32_t top = rows.upper[left] * (256 - at.u) + rows.upper[right] * at.u;
+    const int32_t bottom = rows.lower[left] * (256 - at.u) + rows.lower[right] * at.u;
+    *rgb++ = static_cast<uint8_t>((top * (256 - rows.v) + bottom * rows.v + 32768) >> 16);
+  }
+  return rgb;
+}
+
+// The same of pixels with alpha: each colour counts by its alpha, so that what is transparent gives none away.
+uint8_t* BlendPixelBetween(const RowPair& rows, const RowPair& alphas, const ColumnPair& at, const uint8_t* behind,
+                           uint8_t* rgb) {
+  constexpr uint32_t kWhole = 65536 * 255;  // the weight of what is opaque
+  const auto weight = [](int32_t across, int32_t down, uint8_t alpha) { return static_cast<uint32_t>(across * down * alpha); };
+  const uint32_t upperLeft = weight(256 - at.u, 256 - rows.v, alphas.upper[at.left]);
+  const uint32_t upperRight = weight(at.u, 256 - rows.v, alphas.upper[at.right]);
+  const uint32_t lowerLeft = weight(256 - at.u, rows.v, alphas.lower[at.left]);
+  const uint32_t lowerRight = weight(at.u, rows.v, alphas.lower[at.right]);
+  const uint32_t through = kWhole - upperLeft - upperRight - lowerLeft - lowerRight;
+  for (int32_t channel = 2; channel >= 0; --channel) {
+    const int32_t left = 3 * at.left + channel, right = 3 * at.right + channel;
+    const uint32_t sum = upperLeft * rows.upper[left] + upperRight * rows.upper[right] + lowerLeft * rows.lower[left] +
+                         lowerRight * rows.lower[right];
+    *rgb++ = static_cast<uint8_t>((sum + through * *behind++ + kWhole / 2) / kWhole);
+  }
+  return rgb;
+}
+
+// One line between four pixels each.
+void DrawBetween(const PackedImage& image, const Positions& columns, int64_t row, uint8_t* rgb) {
+  const RowPair rows(image, row);
+  for (const int64_t column : columns) rgb = DrawPixelBetween(rows, ColumnPair(column, image.Width()), rgb);
+}
+
+void BlendBetween(const ViewSource& source, const Positions& columns, int64_t row, const uint8_t* behind, uint8_t* rgb) {
+  const RowPair rows(source.image, row), alphas(source.alpha, row);
+  for (const int64_t column : columns) {
+    const ColumnPair at(column, source.image.Width());
+    const int32_t alpha = alphas.upper[at.left] + alphas.upper[at.right] + alphas.lower[at.left] + alphas.lower[at.right];
+    if (alpha == 0) {
+      rgb = std::copy_n(behind, 3, rgb);
+    } else if (alpha == 4 * 255) {
+      rgb = DrawPixelBetween(rows, at, rgb);
+    } else {
+      rgb = BlendPixelBetween(rows, alphas, at, behind, rgb);
+    }
+    behind += 3;
+  }
+}
+
+void DrawNearest(const uint8_t* bgr, const Positions& columns, uint8_t* rgb) {
+  for (const int64_t column : columns) {
+    const uint8_t* pixel = bgr + 3 * (column >> 16);
+    for (int channel = 2; channel >= 0; --channel) *rgb++ = pixel[channel];
+  }
+}
+
+void BlendNearest(const uint8_t* bgr, const uint8_t* alpha, const Positions& columns, const uint8_t* behind, uint8_t* rgb) {
+  for (const int64_t column : columns) {
+    const uint8_t* pixel = bgr + 3 * (column >> 16);
+    for (int channel = 2; channel >= 0; --channel) *rgb++ = Blend(*behind++, pixel[channel], alpha[column >> 16]);
+  }
+}
+
+// Two rows of what is behind a picture: of the lines whose squares begin with the one colour, and with the other.
+class RowsBehind {
+ public:
+  RowsBehind(const Backdrop& backdrop, int32_t left, int32_t width) : side_(backdrop.squares ? backdrop.side : 1) {
+    for (int32_t phase = 0; phase < 2; ++phase) {
+      for (int32_t x = left; x < left + width; ++x) {
+        const Color color = backdrop.squares ? backdrop.square[(x / side_ + phase) & 1] : backdrop.around;
+        for (int shift = 0; shift < 24; shift += 8) rows_[phase].push_back(static_cast<uint8_t>(color >> shift));
+      }
+    }
+  }
+  const uint8_t* Row(int32_t y) const { return rows_[y / side_ & 1].data(); }
+
+ private:
+  int32_t side_;
+  std::array<std::vector<uint8_t>, 2> rows_;
+};
+
+}  // namespace
+
+void DrawView(const ViewSource& source, const ViewTransform& transform, const Backdrop& backdrop, bool smooth, RgbImage& canvas) {
+  const PackedImage& image = source.image;
+  const int32_t x = transform.X(), y = transform.Y();
+  const int32_t left = std::max(x, 0), right = std::min(x + transform.ShownWidth(), canvas.width);
+  const int32_t top = std::max(y, 0), bottom = std::min(y + transform.ShownHeight(), canvas.height);
+  if (left > 0 || top > 0 || right < canvas.width || bottom < canvas.height) {
+    canvas = FilledImage(canvas.width, canvas.height, backdrop.around);
+  }
+  if (left >= right || top >= bottom || image.Empty() || image.Bits() != 24 || canvas.Empty()) return;
+  const bool same = image.Width() == transform.ShownWidth() && image.Height() == transform.ShownHeight();
+  const bool between = smooth && !same;
+  const bool opaque = source.alpha.Empty();
+  const auto columns = PositionsOf(left - x, right - left, transform.ShownWidth(), image.Width(), between);
+  const auto rows = PositionsOf(top - y, bottom - top, transform.ShownHeight(), image.Height(), between);
+  const RowsBehind behind(backdrop, left, opaque ? 0 : right - left);
+  for (int32_t line = top; line < bottom; ++line) {
+    uint8_t* const rgb = canvas.Row(line) + 3 * left;
+    const int64_t row = rows[static_cast<size_t>(line - top)];
+    const int32_t nearest = static_cast<int32_t>(row >> 16);
+    const uint8_t* const bgr = image.Row(nearest).data();
+    if (between && opaque) {
+      DrawBetween(image, columns, row, rgb);
+    } else if (between) {
+      BlendBetween(source, columns, row, behind.Row(line), rgb);
+    } else if (!opaque) {
+      BlendNearest(bgr, source.alpha.Row(nearest).data(), columns, behind.Row(line), rgb);
+    } else if (same) {
+      SwapColors(bgr + 3 * (left - x), static_cast<size_t>(right - left), rgb);
+    } else {
+      DrawNearest(bgr, columns, rgb);
+    }
+  }
+}
+
+}  // namespace fotomill::desktop
