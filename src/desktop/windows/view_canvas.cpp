@@ -64,7 +64,9 @@ void ViewCanvas::StartAfresh() {
   if (settings.ViewModeKeepZoom == 0) transform_.StartAfresh(settings.DefaultViewZoom);
 }
 
-void ViewCanvas::SetOverlay(const std::string& text) {
+void ViewCanvas::SetOverlay(const std::vector<std::string>& lines) {
+  wxString text;
+  for (const std::string& line : lines) text += (text.empty() ? "" : "\n") + Shown(line);
   if (text == overlay_) return;
   overlay_ = text;
   Refresh();
@@ -163,17 +165,16 @@ void ViewCanvas::PaintMessage(wxDC& dc) const {
   if (picture_ == nullptr) return;
   dc.SetTextForeground(*wxBLACK);
   const std::string name(platform::FileNameOf(picture_->wish.path));
-  dc.DrawLabel(Shown(name + "\n" + std::string(StatusMessage(picture_->status))), wxRect(GetClientSize()), wxALIGN_CENTER);
+  dc.DrawLabel(Shown(name) + "\n" + Shown(StatusMessage(picture_->status)), wxRect(GetClientSize()), wxALIGN_CENTER);
 }
 
 void ViewCanvas::PaintOverlay(wxDC& dc) const {
-  const wxString text = Shown(overlay_);
-  const wxSize extent = dc.GetMultiLineTextExtent(text) + FromDIP(wxSize(20, 10));
+  const wxSize extent = dc.GetMultiLineTextExtent(overlay_) + FromDIP(wxSize(20, 10));
   dc.SetPen(*wxTRANSPARENT_PEN);
   dc.SetBrush(wxBrush(wxColour(0, 0, 0, 170)));
   dc.DrawRoundedRectangle(wxPoint(FromDIP(12), FromDIP(12)), extent, FromDIP(6));
   dc.SetTextForeground(*wxWHITE);
-  dc.DrawText(text, FromDIP(22), FromDIP(17));
+  dc.DrawText(overlay_, FromDIP(22), FromDIP(17));
 }
 
 // --- mouse ---

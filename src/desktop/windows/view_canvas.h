@@ -5,6 +5,7 @@
 #include <functional>
 #include <memory>
 #include <string>
+#include <vector>
 
 #include "desktop/view_drawing.h"
 #include "desktop/view_picture.h"
@@ -34,7 +35,7 @@ class ViewCanvas : public wxWindow {
   // The next picture is another one: it is shown as pictures open, unless ViewModeKeepZoom keeps zoom and place.
   void StartAfresh();
   // Lines on top of the picture; empty for none.
-  void SetOverlay(const std::string& text);
+  void SetOverlay(const std::vector<std::string>& lines);
 
   void ZoomIn() { ZoomBy(ViewTransform::kStep); }
   void ZoomOut() { ZoomBy(1 / ViewTransform::kStep); }
@@ -71,7 +72,7 @@ class ViewCanvas : public wxWindow {
   PackedImage standIn_;  // on the screen until the picture comes; else empty
   std::unique_ptr<ViewScaler::Scaled> scaled_;
   ViewTransform transform_;
-  std::string overlay_;
+  wxString overlay_;
   wxPoint drag_;
   std::unique_ptr<ViewScaler> scaler_;
 };

@@ -185,13 +185,11 @@ std::string ViewFrame::StatusLine() const {
 }
 
 // Name, what the status bar tells, what the camera wrote.
-std::string ViewFrame::OverlayText() const {
-  std::string text(platform::FileNameOf(list_[place_]));
-  text += "\n" + StatusLine();
+std::vector<std::string> ViewFrame::OverlayLines() const {
+  std::vector<std::string> lines = {std::string(platform::FileNameOf(list_[place_])), StatusLine()};
   const ViewPicturePointer& shown = canvas_->Picture();
-  if (!IsCurrent(shown)) return text;
-  for (const std::string& line : shown->photo) text += "\n" + line;
-  return text;
+  if (IsCurrent(shown)) lines.insert(lines.end(), shown->photo.begin(), shown->photo.end());
+  return lines;
 }
 
 void ViewFrame::ViewChanged() {
@@ -201,7 +199,7 @@ void ViewFrame::ViewChanged() {
   SetTitle(name + " - View");
   SetStatusText(Shown(line));
   TellScreenReader(*canvas_, name, Shown(line));
-  canvas_->SetOverlay(overlay_ ? OverlayText() : std::string());
+  canvas_->SetOverlay(overlay_ ? OverlayLines() : std::vector<std::string>());
 }
 
 void ViewFrame::ToggleFullScreen() {

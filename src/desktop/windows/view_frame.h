@@ -46,7 +46,7 @@ class ViewFrame : public wxFrame {
   ViewWish WishOf(size_t place) const;
   bool IsCurrent(const ViewPicturePointer& picture) const;
   std::string StatusLine() const;
-  std::string OverlayText() const;
+  std::vector<std::string> OverlayLines() const;
   void HidePointerLater();
   void OnKey(wxKeyEvent& event);
   bool PanByKey(int key);
