@@ -38,6 +38,7 @@ constexpr Command kCommands[] = {
     {"config path",  "print where the configuration file is",                  Needs::Settings, SetUpConfigPath},
     {"thumbs make",  "make the thumbnail files of pictures",                   Needs::Formats,  SetUpThumbsMake},
     {"thumbs show",  "write a thumbnail as a picture",                         Needs::Formats,  SetUpThumbsShow},
+    {"thumbs draw",  "write a picture as small as a thumbnail",                Needs::Formats,  SetUpThumbsDraw},
     {"thumbs list",  "tell which pictures of a folder have thumbnails",        Needs::Formats,  SetUpThumbsList},
     {"thumbs clean", "delete thumbnail files whose pictures are gone",         Needs::Formats,  SetUpThumbsClean},
     {"tdb add",      "add thumbnails of pictures to a thumbnail database",     Needs::Formats,  SetUpTdbAdd},

@@ -16,11 +16,13 @@
 #include "cli/result_output.h"
 #include "cli/used_files.h"
 #include "core/settings.h"
+#include "metadata/picture_exif.h"
 #include "picture/registry.h"
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "platform/process.h"
 #include "platform/volumes.h"
+#include "processing/scale.h"
 
 namespace fotomill::cli {
 
@@ -31,6 +33,7 @@ struct ThumbsOptions {
   std::string out;
   std::string overwrite = "refuse";
   int32_t jobs = 0;
+  int32_t side = 256;
   bool force = false;
   bool dryRun = false;
   bool json = false;
@@ -132,6 +135,21 @@ int RunMake(const ThumbsOptions& options, const CommandContext& context) {
   return output.Finish();
 }
 
+// Writes what a command drew; a file of that name stays unless it may be replaced.
+int WriteDrawing(PictureRecord& picture, const std::string& name, const ThumbsOptions& options, ResultOutput& output) {
+  WriteOptions write;
+  write.existing = options.overwrite == "replace" ? platform::Existing::Replace : platform::Existing::Refuse;
+  const Status status = WritePicture(picture, options.out, write);
+  if (status != Status::Ok) {
+    const bool taken = write.existing == platform::Existing::Refuse && platform::FileExists(options.out);
+    output.Failure(options.out, status, taken ? "The file is there; --overwrite replace replaces it." : "");
+    return output.Finish();
+  }
+  output.CountFile();
+  output.Line(output.Shown(name) + " -> " + output.Shown(options.out));
+  return output.Finish();
+}
+
 int RunShow(const ThumbsOptions& options, const CommandContext& context) {
   const std::string& name = context.names.values[0];
   ResultOutput output(context, false);
@@ -148,16 +166,30 @@ int RunShow(const ThumbsOptions& options, const CommandContext& context) {
   picture->width = picture->image.Width();
   picture->height = picture->image.Height();
   picture->bitsPerPixel = picture->image.Bits();
-  WriteOptions write;
-  write.existing = options.overwrite == "replace" ? platform::Existing::Replace : platform::Existing::Refuse;
-  const Status status = WritePicture(*picture, options.out, write);
-  if (status != Status::Ok) {
-    const bool taken = write.existing == platform::Existing::Refuse && platform::FileExists(options.out);
-    return fail(options.out, status, taken ? "The file is there; --overwrite replace replaces it." : "");
+  return WriteDrawing(*picture, name, options, output);
+}
+
+// A picture upright and in a square; smaller ones keep their size.
+Status DrawPicture(const std::string& name, int32_t side, PicturePointer& picture) {
+  RETURN_IF_BAD(LoadPictureInfo(name.c_str(), picture));
+  picture->thumbnailSide = side;
+  RETURN_IF_BAD(ReadPicture(*picture));
+  RETURN_IF_BAD(TurnUpright(*picture));
+  picture->metadata = {};
+  const int32_t width = picture->image.Width(), height = picture->image.Height();
+  if (width <= side && height <= side) return Status::Ok;
+  return ScalePicture(*picture, FitSize(width, height, side), ScaleFilter::Bicubic);
+}
+
+int RunDraw(const ThumbsOptions& options, const CommandContext& context) {
+  const std::string& name = context.names.values[0];
+  ResultOutput output(context, false);
+  PicturePointer picture;
+  if (const Status status = DrawPicture(name, options.side, picture); status != Status::Ok) {
+    output.Failure(name, status, OpenHint(name, status));
+    return output.Finish();
   }
-  output.CountFile();
-  output.Line(output.Shown(name) + " -> " + output.Shown(options.out));
-  return output.Finish();
+  return WriteDrawing(*picture, name, options, output);
 }
 
 // The pictures of a folder, or a failure of the whole command.
@@ -247,6 +279,17 @@ void SetUpThumbsShow(CLI::App& app, CommandContext& context) {
   Require(AddName(app, "-o,--out", options->out, "FILE", "The picture to write, in the format of its extension"));
   AddChoice(app, "--overwrite", options->overwrite, "HOW", {"refuse", "replace"},
             "When FILE is there: refuse (the default) or replace");
+}
+
+void SetUpThumbsDraw(CLI::App& app, CommandContext& context) {
+  const auto options = SetUp(app, context, RunDraw,
+                             "The picture is turned upright by its EXIF. Programs that show folders call this for thumbnails "
+                             "of their own.\n\nExample: fotomill thumbs draw scan.pcx --side 128 --out scan.png");
+  context.names.Declare("FILE", "The picture", 1, 1);
+  Require(AddName(app, "-o,--out", options->out, "FILE", "The picture to write, in the format of its extension"));
+  AddNumber(app, "--side", options->side, "N", 1, 4096, "Pixels of the longer side at most; 256 is the default");
+  AddChoice(app, "--overwrite", options->overwrite, "HOW", {"refuse", "replace"},
+            "When the file to write is there: refuse (the default) or replace");
 }
 
 void SetUpThumbsList(CLI::App& app, CommandContext& context) {

@@ -281,6 +281,17 @@ TEST_F(ThumbsCommand, PicturesOfOneNameShareTheLastOnesThumbnail) {
   }
 }
 
+TEST_F(ThumbsCommand, DrawsAPictureSmall) {
+  WriteBytes(In("a.bmp"), BitmapFile(300, 100, 24));
+  WriteText(In("t.bmp"), "");
+  EXPECT_EQ(RunCommand({"thumbs", "draw", In("a.bmp"), "--out", In("t.bmp"), "--side", "90"}).status, 1);
+  EXPECT_EQ(RunCommand({"thumbs", "draw", In("a.bmp"), "--out", In("t.bmp"), "--side", "90", "--overwrite", "replace"}).status, 0);
+  EXPECT_EQ(std::filesystem::file_size(In("t.bmp")), 54u + (90 * 3 + 2) * 30);
+  EXPECT_EQ(RunCommand({"thumbs", "draw", In("a.bmp"), "--out", In("whole.bmp"), "--side", "300"}).status, 0);
+  EXPECT_EQ(std::filesystem::file_size(In("whole.bmp")), 54u + 300 * 3 * 100);
+  EXPECT_TRUE(RunCommand({"thumbs", "draw", In("x.bmp"), "--out", In("u.bmp")}).Says(In("x.bmp") + ": File open error."));
+}
+
 TEST_F(ThumbsCommand, ShowsAThumbnailAsAPicture) {
   Put("a.bmp");
   ASSERT_EQ(RunCommand({"thumbs", "make", In("a.bmp")}).status, 0);
