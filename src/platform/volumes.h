@@ -2,6 +2,7 @@
 
 #include <cstdint>
 #include <string>
+#include <vector>
 
 namespace fotomill::platform {
 
@@ -20,6 +21,9 @@ struct Volume {
 Volume VolumeOf(const std::string& path);
 using VolumeFunction = Volume (*)(const std::string& path);
 void ReplaceVolumeFunction(VolumeFunction function);  // null restores the system's
+
+// Where volumes of the user are mounted: drives that were plugged in, discs, shares. In order, without asking the volumes.
+std::vector<std::string> UserVolumes();
 
 // Free bytes on the volume of a path (likewise), 0 when unknown.
 uint64_t FreeSpace(const std::string& path);

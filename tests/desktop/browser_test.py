@@ -72,6 +72,8 @@ def open_select_view(folder):
         desktop.wait(r"view=0 .*/sub$")
         desktop.key("alt+Up")
         desktop.wait(r"listing=0 view=4 .*/pictures$")
+        desktop.key("ctrl+d")
+        desktop.wait(r"favourites 1")
         # The menu of folders gone through, and one that is typed and completed.
         desktop.key("alt+Down")
         desktop.wait(r"folder-menu 3")

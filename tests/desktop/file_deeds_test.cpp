@@ -2,6 +2,8 @@
 
 #include <gmock/gmock.h>
 
+#include "core/data_folder.h"
+#include "desktop/favourites.h"
 #include "desktop/pasted_picture.h"
 #include "desktop/session.h"
 #include "picture/registry.h"
@@ -102,6 +104,22 @@ TEST(UndoList, KeepsSoMany) {
   EXPECT_FALSE(list.CanUndo());
   list.Add(deed("d"));
   EXPECT_FALSE(list.CanRedo());
+}
+
+TEST(Favourites, AreKeptInOrderAndFollowRenames) {
+  const test::TemporaryFolder folder;
+  const std::string before = DataFolder();
+  SetDataFolder(folder.Path());
+  Favourites favourites;
+  for (const char* added : {"/b", "/a/c", "/b", "/a b"}) EXPECT_TRUE(favourites.Add(added));
+  EXPECT_FALSE(favourites.Add("/new\nline"));
+  Favourites other;  // of another process
+  EXPECT_TRUE(other.Remove("/b"));
+  EXPECT_TRUE(favourites.FollowRename("/a", "/z"));
+  EXPECT_FALSE(favourites.FollowRename("/q", "/z"));
+  favourites.Load();
+  EXPECT_EQ(favourites.Folders(), (std::vector<std::string>{"/z/c", "/a b"}));
+  SetDataFolder(before);
 }
 
 TEST(FolderViews, AreKeptPerFolderTheLatestFirst) {

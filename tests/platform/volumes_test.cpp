@@ -100,6 +100,14 @@ TEST_F(MountTest, EveryMountIsDescribed) {
   EXPECT_NE(DescribeMount(mounts[0], 99, root_.Path()).serial, DescribeMount(mounts[3], 99, root_.Path()).serial);
 }
 
+TEST(Volumes, ThoseOfTheUser) {
+  const auto mounts = ParseMountTable(
+      "1 0 8:1 / / rw - ext4 /dev/sda1 rw\n2 1 8:2 / /mnt/d\\040e rw - ext4 /dev/sda2 rw\n3 1 8:3 / /media/me/A rw - vfat "
+      "/dev/sdb1 rw\n"
+      "4 1 8:3 / /media/me/A rw - vfat /dev/sdb1 rw\n5 1 0:9 / /mnt rw - tmpfs x rw\n");
+  EXPECT_EQ(UserVolumesAmong(mounts), (std::vector<std::string>{"/media/me/A", "/mnt/d e"}));
+}
+
 TEST(Volumes, TheSystemsOwnAnswer) {
   const TemporaryFolder folder;
   WriteText(folder.Path("file"), "");

@@ -77,6 +77,9 @@ void NextTab(MainFrame& frame) { frame.StepTab(1); }
 void PreviousTab(MainFrame& frame) { frame.StepTab(-1); }
 void Quit(MainFrame& frame) { frame.Close(); }
 void ToggleFolders(MainFrame& frame) { frame.ShowFolders(!frame.FoldersShown()); }
+void ReadFoldersAgain(MainFrame& frame) { frame.FilesChanged(); }
+void ToggleFavourite(MainFrame& frame) { frame.ToggleFavourite(frame.CurrentFolder()); }
+bool IsFavourite(const MainFrame& frame) { return frame.IsFavourite(frame.CurrentFolder()); }
 void Larger(MainFrame& frame) {
   if (BrowserPage* browser = frame.Browser()) browser->ChangeSize(1);
 }
@@ -143,13 +146,14 @@ constexpr Command kCommands[] = {
     {kView, "Thumbnails: lo&cal database", "",     "Thumbnails come from the database in the folder.", Needs::Nothing, ThumbnailsFrom<choice::kLocalDatabase>, nullptr, false, Has<&BrowserModes::thumbnails, choice::kLocalDatabase>},
     {kView, nullptr},
     {kView, "&Folders",            "F9",           "Shows or hides the folders at the left.", Needs::Nothing, ToggleFolders, nullptr, false, HasFolders},
-    {kView, "&Refresh",            "F5",           "Reads the folder again.", Needs::Nothing, OfBrowser<&BrowserPage::Reload>},
+    {kView, "&Refresh",            "F5",           "Reads the folders again.", Needs::Nothing, ReadFoldersAgain},
 
     {kGo, "&Back",                 "Alt+Left",     "Goes to the folder before this one.", Needs::Nothing, OfBrowser<&BrowserPage::GoBack>},
     {kGo, "&Forward",              "Alt+Right",    "Goes forward again.", Needs::Nothing, OfBrowser<&BrowserPage::GoForward>},
     {kGo, "Folders gone t&hrough...", "Alt+Down",  "Offers the folders that this tab showed.", Needs::Nothing, OfBrowser<&BrowserPage::OfferTrail>},
     {kGo, "&Parent folder",        "Alt+Up",       "Goes to the folder above this one.", Needs::Nothing, OfBrowser<&BrowserPage::GoUp>},
     {kGo, "&Enter a folder",       "Ctrl+L",       "Lets you type a folder.", Needs::Nothing, OfBrowser<&BrowserPage::EditPath>},
+    {kGo, "F&avourite",            "Ctrl+D",       "Keeps this folder at the top of the folders at the left, or takes it away from there.", Needs::Nothing, ToggleFavourite, nullptr, false, IsFavourite},
     {kGo, nullptr},
     {kGo, "&Next tab",             "Ctrl+PageDown", "Goes to the next tab.", Needs::Nothing, NextTab},
     {kGo, "Pre&vious tab",         "Ctrl+PageUp",  "Goes to the previous tab.", Needs::Nothing, PreviousTab},

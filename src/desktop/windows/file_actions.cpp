@@ -95,7 +95,15 @@ void FileActions::Do(DeedKind kind, const std::vector<std::string>& paths, const
   what[0] = static_cast<char>(what[0] - 'a' + 'A');
   Run(
       what, [kind, paths, folder](const DeedProgress& progress) { return CarryOut(PlanDeed(kind, paths, folder), progress); },
-      [this](DeedResult result) { undo_.Add(std::move(result.done)); });
+      [this](DeedResult result) {
+        Follow(result.done, false);
+        undo_.Add(std::move(result.done));
+      });
+}
+
+void FileActions::Follow(const FileDeed& deed, bool back) {
+  if (deed.kind != DeedKind::Rename && deed.kind != DeedKind::Move) return;
+  for (const FileStep& step : deed.steps) frame_.FollowRename(back ? step.to : step.from, back ? step.from : step.to);
 }
 
 void FileActions::Trash(const std::vector<std::string>& paths) {
@@ -140,6 +148,7 @@ void FileActions::RenameAll(std::vector<FileStep> steps) {
         for (const FileStep& step : result.done.steps) {
           frame_.NoteUses({FileUse{step.from, FileFunction::MoveAndCopy, kOwnTime, kOwnTime, true}});
         }
+        Follow(result.done, false);
         undo_.Add(std::move(result.done));
         if (BrowserPage* browser = frame_.Browser(); one && done && browser != nullptr)
           browser->Open(browser->Model().Folder(), shown);
@@ -155,7 +164,9 @@ void FileActions::NewFolder(const std::string& parent) {
     wxMessageBox("The folder could not be made.", "New folder", wxOK | wxICON_WARNING, &frame_);
     return;
   }
-  if (BrowserPage* browser = frame_.Browser()) browser->Open(parent, name);
+  if (BrowserPage* browser = frame_.Browser(); browser != nullptr && browser->Model().Folder() == parent)
+    browser->Open(parent, name);
+  frame_.FilesChanged();
 }
 
 // --- undo ---
@@ -165,7 +176,10 @@ void FileActions::Undo() {
   const FileDeed deed = undo_.TakeUndo();
   Run(
       "Undo " + DeedName(deed), [deed](const DeedProgress& progress) { return TakeBack(deed, progress); },
-      [this](DeedResult result) { undo_.Undone(std::move(result.done)); });
+      [this](DeedResult result) {
+        Follow(result.done, true);
+        undo_.Undone(std::move(result.done));
+      });
 }
 
 void FileActions::Redo() {
@@ -173,7 +187,10 @@ void FileActions::Redo() {
   const FileDeed deed = undo_.TakeRedo();
   Run(
       "Redo " + DeedName(deed), [deed](const DeedProgress& progress) { return CarryOut(deed, progress); },
-      [this](DeedResult result) { undo_.Redone(std::move(result.done)); });
+      [this](DeedResult result) {
+        Follow(result.done, false);
+        undo_.Redone(std::move(result.done));
+      });
 }
 
 // --- clipboard ---

@@ -52,6 +52,8 @@ class FileActions : public wxEvtHandler {
   void Do(DeedKind kind, const std::vector<std::string>& paths, const std::string& folder);
   void Finished(const std::string& what, DeedResult result, const Then& then);
   void PastePicture(const std::string& folder);
+  // Windows that show a renamed or moved folder go with it.
+  void Follow(const FileDeed& deed, bool back);
   void TellFailures(const std::vector<DeedFailure>& failures);
 
   MainFrame& frame_;

@@ -46,6 +46,7 @@ MainFrame::MainFrame()
       usesTimer_(this) {
   SetSize(FromDIP(wxSize(1180, 760)));
   views_.Load();
+  favourites_.Load();
   BuildMenus();
   BuildToolbar();
   BuildPanes();
@@ -56,6 +57,11 @@ MainFrame::MainFrame()
   batches_ = std::make_unique<BatchRunner>(*this);
   files_ = std::make_unique<FileActions>(*this);
   Bind(wxEVT_CLOSE_WINDOW, &MainFrame::OnClose, this);
+  // A volume may have come or gone while others had the keyboard.
+  Bind(wxEVT_ACTIVATE, [this](wxActivateEvent& event) {
+    if (event.GetActive()) tree_->UpdatePlaces();
+    event.Skip();
+  });
   Bind(
       wxEVT_TIMER, [this](wxTimerEvent&) { FlushUses(); }, usesTimer_.GetId());
 }
@@ -144,9 +150,15 @@ void MainFrame::ShowContextMenu(wxWindow& window, const wxPoint& place, bool onF
 void MainFrame::BuildPanes() {
   splitter_ = new wxSplitterWindow(this, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxSP_LIVE_UPDATE | wxSP_NOBORDER);
   splitter_->SetMinimumPaneSize(FromDIP(120));
-  tree_ = new FolderTree(splitter_, [this](const std::string& folder) {
+  FolderTree::Events events;
+  events.chosen = [this](const std::string& folder) {
     if (BrowserPage* browser = Browser()) browser->Open(folder);
-  });
+  };
+  events.openInTab = [this](const std::string& folder) { OpenTab(folder); };
+  events.newFolder = [this](const std::string& folder) { files_->NewFolder(folder); };
+  events.rename = [this](const std::string& folder, const std::string& name) { files_->Rename(folder, name); };
+  events.toggleFavourite = [this](const std::string& folder) { ToggleFavourite(folder); };
+  tree_ = new FolderTree(splitter_, favourites_, events);
   tree_->SetDropTarget(new FolderDrop(
       [this](const wxPoint& place) { return tree_->FolderAt(place); },
       [this](const std::vector<std::string>& files, const std::string& folder, bool move) { DropFiles(files, folder, move); }));
@@ -353,7 +365,24 @@ void MainFrame::SelectFiles(const std::vector<std::string>& files) {
   browser->SelectionChanged();
 }
 
+void MainFrame::ToggleFavourite(const std::string& folder) {
+  const bool written = favourites_.Has(folder) ? favourites_.Remove(folder) : favourites_.Add(folder);
+  if (!written) Tell("The list of favourites could not be changed.");
+  tree_->UpdatePlaces();
+  LogEvent("favourites", std::to_string(favourites_.Folders().size()));
+}
+
+void MainFrame::FollowRename(const std::string& from, const std::string& to) {
+  if (favourites_.FollowRename(from, to)) tree_->UpdatePlaces();
+  for (size_t tab = 0; tab < tabs_->GetPageCount(); ++tab) {
+    const std::string& folder = PageAt(tab)->Model().Folder();
+    if (LiesIn(folder, from)) PageAt(tab)->Open(RenamedPath(folder, from, to));
+  }
+}
+
 void MainFrame::FilesChanged() {
+  tree_->UpdatePlaces();
+  tree_->Reread();
   for (size_t tab = 0; tab < tabs_->GetPageCount(); ++tab) PageAt(tab)->Reload();
 }
 

@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "catalog/file_history.h"
+#include "desktop/favourites.h"
 #include "desktop/windows/browser_page.h"
 #include "desktop/windows/thumbnail_service.h"
 
@@ -52,6 +53,11 @@ class MainFrame : public wxFrame, public BrowserHost {
 
   // Selects the files that the browser in front shows.
   void SelectFiles(const std::vector<std::string>& files);
+  // The folder is put among the favourites, or taken out.
+  void ToggleFavourite(const std::string& folder);
+  bool IsFavourite(const std::string& folder) const { return favourites_.Has(folder); }
+  // A folder may have got another name: what shows it, or lies in it, goes on under that one.
+  void FollowRename(const std::string& from, const std::string& to);
   // Files were written, renamed or deleted: browsers look again.
   void FilesChanged();
   // For the file history, which is written when nothing else is to be done.
@@ -86,6 +92,7 @@ class MainFrame : public wxFrame, public BrowserHost {
 
   ThumbnailService thumbnails_;
   FolderViews views_;
+  Favourites favourites_;
   wxSplitterWindow* splitter_ = nullptr;
   FolderTree* tree_ = nullptr;
   wxAuiNotebook* tabs_ = nullptr;

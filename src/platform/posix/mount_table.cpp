@@ -145,11 +145,25 @@ std::vector<Mount> ParseMountTable(std::string_view text) {
     }
     const auto dash = std::find(words.size() > 6 ? words.begin() + 6 : words.end(), words.end(), "-");
     if (words.end() - dash < 3) continue;
-    Mount mount{0, std::string(words[2]), DecodeOctal(dash[1]), DecodeOctal(dash[2])};
+    Mount mount{0, std::string(words[2]), DecodeOctal(dash[1]), DecodeOctal(dash[2]), DecodeOctal(words[4])};
     const char* end = words[0].data() + words[0].size();
     if (std::from_chars(words[0].data(), end, mount.id).ptr == end) mounts.push_back(std::move(mount));
   }
   return mounts;
+}
+
+std::vector<std::string> UserVolumesAmong(const std::vector<Mount>& mounts) {
+  constexpr std::string_view kFolders[] = {"/media/", "/run/media/", "/mnt/"};
+  std::vector<std::string> places;
+  for (const Mount& mount : mounts) {
+    const auto holds = [&](std::string_view folder) {
+      return mount.place.size() > folder.size() && mount.place.starts_with(folder);
+    };
+    if (std::ranges::any_of(kFolders, holds)) places.push_back(mount.place);
+  }
+  std::ranges::sort(places);
+  places.erase(std::ranges::unique(places).begin(), places.end());
+  return places;
 }
 
 Volume DescribeMount(const Mount& mount, uint32_t fileSystemId, const std::string& root) {

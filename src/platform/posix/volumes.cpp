@@ -39,6 +39,10 @@ uint32_t FileSystemId(const std::string& path) {
   return halves[0] ^ halves[1];
 }
 
+bool ReadMountTable(std::string& table) {
+  return ReadWholeFile("/proc/self/mountinfo", kLongestMountTable, table) == ReadResult::Done;
+}
+
 Volume AskSystem(const std::string& path) {
   const std::string file = NearestFile(path);
   struct statx facts;
@@ -47,7 +51,7 @@ Volume AskSystem(const std::string& path) {
   volume.available = true;
   volume.serial = FileSystemId(file);
   std::string table;
-  if (ReadWholeFile("/proc/self/mountinfo", kLongestMountTable, table) != ReadResult::Done) return volume;
+  if (!ReadMountTable(table)) return volume;
   const std::string device = std::to_string(facts.stx_dev_major) + ":" + std::to_string(facts.stx_dev_minor);
   const bool idKnown = (facts.stx_mask & STATX_MNT_ID) != 0;
   for (const Mount& mount : ParseMountTable(table)) {
@@ -65,6 +69,11 @@ std::atomic<VolumeFunction> volumeFunction{AskSystem};
 Volume VolumeOf(const std::string& path) { return volumeFunction.load()(path); }
 
 void ReplaceVolumeFunction(VolumeFunction function) { volumeFunction = function != nullptr ? function : AskSystem; }
+
+std::vector<std::string> UserVolumes() {
+  std::string table;
+  return ReadMountTable(table) ? UserVolumesAmong(ParseMountTable(table)) : std::vector<std::string>();
+}
 
 uint64_t FreeSpace(const std::string& path) {
   struct statvfs facts;
