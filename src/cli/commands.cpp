@@ -14,6 +14,7 @@
 #include "cli/rename.h"
 #include "cli/tdb.h"
 #include "cli/thumbs.h"
+#include "cli/turn.h"
 #include "cli/verify.h"
 
 namespace fotomill::cli {
@@ -25,6 +26,7 @@ constexpr Command kCommands[] = {
     {"convert", "convert pictures to another format",                          Needs::Formats,  SetUpConvert},
     {"rename",  "number files, each under a base name or with its own",        Needs::Formats,  SetUpRename},
     {"contact-sheet", "draw pictures on pages, each with its name",            Needs::Formats,  SetUpContactSheet},
+    {"turn",    "rotate or flip pictures, JPEG without loss",                  Needs::Formats,  SetUpTurn},
     {"info",    "tell what files hold, without decoding them",                 Needs::Formats,  SetUpInfo},
     {"formats", "list the formats and what this build can do with them",       Needs::Formats,  SetUpFormats},
     {"match",   "tell which format a file name selects, without opening it",   Needs::Formats,  SetUpMatch},

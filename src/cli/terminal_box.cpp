@@ -25,6 +25,7 @@ void TerminalBox::ShowElement(const FileOutcome& outcome) {
   PutName(element, "destination", outcome.status == Status::Ok ? outcome.destination : std::string());
   PutStatus(element, outcome.status);
   if (outcome.skipped) element["skipped"] = true;
+  if (!outcome.note.empty()) element["note"] = outcome.note;
   output_.Element(element);
 }
 

@@ -206,6 +206,7 @@ Status DescribePicture(const platform::FileView& file, PictureRecord& picture, F
   picture.width = static_cast<int32_t>(header.width);
   picture.height = static_cast<int32_t>(header.height);
   picture.bitsPerPixel = 8;
+  picture.simplified = header.bitsPerValue > 8 || header.axes > 2;
   picture.imageBytes = EstimateImageBytes(picture.width, picture.height, 8);
   picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
   picture.palette = GreyRamp();

@@ -247,6 +247,7 @@ Status Describe(std::span<const uint8_t> file, HdpPage& page, PictureRecord& pic
   picture.width = page.image.width;
   picture.height = page.image.height;
   picture.bitsPerPixel = BitsOf(page);
+  picture.simplified = page.image.depth != HdpDepth::U8 || page.image.colors >= HdpColors::Cmyk;
   picture.alphaFlags = static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (HasAlpha(page) ? kHasAlpha : 0));
   picture.imageBytes = EstimateImageBytes(picture.width, picture.height, picture.bitsPerPixel);
   TakePalette(picture.bitsPerPixel, picture.palette);

@@ -204,7 +204,9 @@ int32_t FrameCount(std::span<const uint8_t> file) {
 Status Describe(PngReader& reader, std::span<const uint8_t> file, PngLayout& layout, PictureRecord& picture) {
   RETURN_IF_BAD(ReadHeader(reader));
   layout = ChooseLayout(reader);
-  picture.pageCount = settings.RecognizeAPNG != 0 ? FrameCount(file) : 1;
+  const int32_t frames = FrameCount(file);
+  picture.pageCount = settings.RecognizeAPNG != 0 ? frames : 1;
+  picture.simplified = frames > 1 || png_get_bit_depth(reader.png, reader.info) > 8;
   picture.typeName.AssignCut(picture.pageCount > 1 ? "Animated PNG" : "Portable Network Graphics");
   picture.width = layout.width;
   picture.height = layout.height;

@@ -223,6 +223,7 @@ Status Describe(TiffInput& input, TiffLayout& layout, PictureRecord& picture) {
   picture.width = static_cast<int32_t>(layout.width);
   picture.height = static_cast<int32_t>(layout.height);
   picture.bitsPerPixel = layout.bitsPerPixel;
+  picture.simplified = layout.form.bits > 8 || layout.colors > 3 || layout.photometric >= PHOTOMETRIC_CIELAB;
   picture.alphaFlags = static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (layout.alpha >= 0 ? kHasAlpha : 0));
   picture.imageBytes = EstimateImageBytes(picture.width, picture.height, picture.bitsPerPixel);
   TakePalette(tiff, layout, picture.palette);

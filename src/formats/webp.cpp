@@ -397,10 +397,10 @@ Status WebpWrite(PictureRecord& picture, const WriteOptions& options) {
   if (picture.image.Width() > WEBP_MAX_DIMENSION || picture.image.Height() > WEBP_MAX_DIMENSION) return Status::UnsuitableImage;
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
-  const bool lossless = settings.WebPLossless != 0;
+  const bool lossless = options.lossless || settings.WebPLossless != 0;
   EncodedFile encoded, other;
   RETURN_IF_BAD(Encode(picture, lossless, encoded.writer));
-  if (settings.WebPAllowMixed != 0) RETURN_IF_BAD(Encode(picture, !lossless, other.writer));
+  if (!options.lossless && settings.WebPAllowMixed != 0) RETURN_IF_BAD(Encode(picture, !lossless, other.writer));
   const bool useOther = other.writer.size > 0 && other.writer.size < encoded.writer.size;
   const WebPMemoryWriter& chosen = useOther ? other.writer : encoded.writer;
   const std::span<const uint8_t> bytes(chosen.mem, chosen.size);

@@ -1,18 +1,26 @@
 #include "metadata/picture_exif.h"
 
 #include "metadata/exif_edit.h"
-#include "processing/orient.h"
+#include "metadata/xmp_edit.h"
 
 namespace fotomill {
 
-Status TurnUpright(PictureRecord& picture) {
+Orientation OrientationOf(const PictureRecord& picture) {
+  return static_cast<Orientation>(ExifOrientation(picture.metadata.exif));
+}
+
+Status TurnPicture(PictureRecord& picture, Orientation turn) {
+  RETURN_IF_BAD(OrientPicture(picture, turn));
   std::vector<uint8_t>& exif = picture.metadata.exif;
-  const auto orientation = static_cast<Orientation>(ExifOrientation(exif));
-  if (orientation == Orientation::Upright) return Status::Ok;
-  RETURN_IF_BAD(OrientPicture(picture, orientation));
-  DropExifThumbnail(exif);
+  if (turn != Orientation::Upright) DropExifThumbnail(exif);
   SetExifPictureFacts(exif, {.orientation = 1});
+  SetXmpOrientation(picture.metadata.xmp, 1);
   return Status::Ok;
+}
+
+Status TurnUpright(PictureRecord& picture) {
+  const Orientation orientation = OrientationOf(picture);
+  return orientation == Orientation::Upright ? Status::Ok : TurnPicture(picture, orientation);
 }
 
 void RefreshExif(PictureRecord& picture) {

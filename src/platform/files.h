@@ -61,6 +61,13 @@ bool HasTrash(const std::string& path);
 bool IsHidden(const std::string& path);
 // Clears hidden and read-only.
 [[nodiscard]] bool SetNormal(const std::string& path);
+// A file's modification time, as finely as the system keeps it.
+struct ExactTime {
+  int64_t seconds = 0;
+  int64_t nanoseconds = 0;
+};
+std::optional<ExactTime> ModificationTime(const std::string& path);
+[[nodiscard]] bool SetModificationTime(const std::string& path, ExactTime time);
 // Gives a file the modification time of another, as finely as the system keeps it.
 [[nodiscard]] bool CopyTimes(const std::string& from, const std::string& to);
 

@@ -166,11 +166,20 @@ bool SetNormal(const std::string& path) {
   return fchmodat(AT_FDCWD, path.c_str(), (facts.st_mode & 07777) | S_IWUSR, AT_SYMLINK_NOFOLLOW) == 0;
 }
 
-bool CopyTimes(const std::string& from, const std::string& to) {
+std::optional<ExactTime> ModificationTime(const std::string& path) {
   struct stat facts;
-  if (stat(from.c_str(), &facts) != 0) return false;
-  const timespec times[2] = {{0, UTIME_OMIT}, facts.st_mtim};
-  return utimensat(AT_FDCWD, to.c_str(), times, AT_SYMLINK_NOFOLLOW) == 0;
+  if (stat(path.c_str(), &facts) != 0) return std::nullopt;
+  return ExactTime{facts.st_mtim.tv_sec, facts.st_mtim.tv_nsec};
+}
+
+bool SetModificationTime(const std::string& path, ExactTime time) {
+  const timespec times[2] = {{0, UTIME_OMIT}, {time.seconds, time.nanoseconds}};
+  return utimensat(AT_FDCWD, path.c_str(), times, AT_SYMLINK_NOFOLLOW) == 0;
+}
+
+bool CopyTimes(const std::string& from, const std::string& to) {
+  const auto time = ModificationTime(from);
+  return time && SetModificationTime(to, *time);
 }
 
 ReadResult ReadWholeFile(const std::string& path, uint64_t most, std::string& contents) {

@@ -1,0 +1,160 @@
+#include "batch/turn_file.h"
+
+#include <algorithm>
+#include <vector>
+
+#include "batch/picture_failure.h"
+#include "core/byte_writer.h"
+#include "formats/jpeg.h"
+#include "metadata/picture_exif.h"
+#include "metadata/turned_jpeg.h"
+#include "picture/registry.h"
+#include "platform/file_view.h"
+#include "platform/files.h"
+#include "platform/paths.h"
+#include "platform/temporary_file.h"
+
+namespace fotomill {
+
+namespace {
+
+// Whether both show the same, pixel for pixel, at whatever depth.
+bool LookTheSame(const PictureRecord& a, const PictureRecord& b) {
+  if (a.image.Width() != b.image.Width() || a.image.Height() != b.image.Height()) return false;
+  if (a.alpha.Empty() != b.alpha.Empty()) return false;
+  const auto color = [](const PictureRecord& picture, int32_t x, int32_t y) {
+    const int32_t pixel = picture.image.PixelAt(x, y);
+    if (picture.image.Bits() == 24) return pixel;
+    const uint8_t* entry = &picture.palette[3 * static_cast<size_t>(pixel)];
+    return entry[0] << 16 | entry[1] << 8 | entry[2];
+  };
+  for (int32_t y = 0; y < a.image.Height(); ++y) {
+    if (!a.alpha.Empty() && !std::ranges::equal(a.alpha.Row(y).first(static_cast<size_t>(a.alpha.Width())),
+                                                b.alpha.Row(y).first(static_cast<size_t>(b.alpha.Width())))) {
+      return false;
+    }
+    if (a.image.Bits() == 24 && b.image.Bits() == 24) {
+      const size_t bytes = 3 * static_cast<size_t>(a.image.Width());
+      if (!std::ranges::equal(a.image.Row(y).first(bytes), b.image.Row(y).first(bytes))) return false;
+      continue;
+    }
+    for (int32_t x = 0; x < a.image.Width(); ++x) {
+      if (color(a, x, y) != color(b, x, y)) return false;
+    }
+  }
+  return true;
+}
+
+// Why a picture cannot be written again as it is, before its pixels are looked at; empty when nothing speaks against it.
+std::string Obstacle(const PictureRecord& picture) {
+  if (!CanWrite(FormatRow(picture.formatIndex))) return "Files of this format cannot be written.";
+  if (picture.pageCount > 1) return "It holds several pictures, of which only one would be left.";
+  if (picture.simplified) return "It holds finer colors than can be written again.";
+  if (!picture.warning.empty()) return "It is damaged, though it can be shown.";
+  return {};
+}
+
+// One file on its way.
+class Turning {
+ public:
+  Turning(const std::string& source, const std::string& destination, const TurnRequest& request, const WriteOptions& options)
+      : source_(source), destination_(destination), request_(request), options_(options) {}
+
+  TurnedFile Run() {
+    result_.status = Turn();
+    return std::move(result_);
+  }
+
+ private:
+  Status Fail(Status status, std::string hint) {
+    result_.hint = std::move(hint);
+    return status;
+  }
+
+  Status Turn() {
+    PicturePointer picture;
+    if (const Status status = LoadPictureInfo(source_.c_str(), picture); status != Status::Ok) {
+      return Fail(status, OpenHint(source_, status));
+    }
+    const auto time = request_.keepTime ? platform::ModificationTime(source_) : std::nullopt;
+    RETURN_IF_BAD(FormatRow(picture->formatIndex).read == JpegRead ? TurnAsJpeg() : TurnDecoded(std::move(picture)));
+    if (!result_.changed || !time || platform::SetModificationTime(destination_, *time)) return Status::Ok;
+    return Fail(Status::ErrorWritingFile, "It was turned, but its time could not be set.");
+  }
+
+  Status TurnAsJpeg() {
+    platform::FileView file;
+    if (!file.Open(source_)) return Status::FileOpenError;
+    std::vector<uint8_t> made;
+    JpegTurnResult turned;
+    const JpegTurnWish wish{.turn = request_.turn, .seenByExif = request_.seenByExif, .trim = request_.trim};
+    if (const Status status = MakeTurnedJpeg(file.Bytes(), wish, made, turned); status != Status::Ok) {
+      return Fail(status, turned.obstacle);
+    }
+    if (!file.Intact()) return Status::FileReadError;
+    if (turned.way == JpegTurnWay::Tag && !turned.obstacle.empty())
+      result_.note = "Turned by its orientation alone. " + turned.obstacle;
+    if (turned.way == JpegTurnWay::Trimmed) result_.note = "An edge was cut off.";
+    return WriteUnlessThere(turned.way == JpegTurnWay::Nothing ? file.Bytes() : made, turned.way == JpegTurnWay::Nothing);
+  }
+
+  Status TurnDecoded(PicturePointer picture) {
+    if (std::string obstacle = Obstacle(*picture); !obstacle.empty()) return Fail(Status::UnsuitableImage, std::move(obstacle));
+    RETURN_IF_BAD(ReadPicture(*picture));
+    if (std::string obstacle = Obstacle(*picture); !obstacle.empty()) return Fail(Status::UnsuitableImage, std::move(obstacle));
+    const Orientation told = OrientationOf(*picture);
+    const Orientation turn = Composed(request_.seenByExif ? told : Orientation::Upright, request_.turn);
+    if (turn == Orientation::Upright && told == Orientation::Upright) {
+      platform::FileView file;
+      if (!file.Open(source_)) return Status::FileOpenError;
+      return WriteUnlessThere(file.Bytes(), true);
+    }
+    RETURN_IF_BAD(TurnPicture(*picture, turn));
+    return WriteDecoded(*picture);
+  }
+
+  // Writes a working file first: only what reads back as it was takes the old one's place.
+  Status WriteDecoded(PictureRecord& picture) {
+    platform::TemporaryFile working;
+    if (!working.Create(std::string(".").append(platform::ExtensionOf(source_)))) return Status::ErrorCreatingFile;
+    RefreshExif(picture);
+    WriteOptions plain;
+    plain.lossless = true;
+    RETURN_IF_BAD(WritePictureAs(picture, working.Path(), picture.formatIndex, plain));
+    PicturePointer back;
+    RETURN_IF_BAD(LoadPicture(working.Path().c_str(), back));
+    const PictureMetadata& metadata = picture.metadata;
+    const bool kept = metadata.exif.empty() == back->metadata.exif.empty() && metadata.xmp == back->metadata.xmp &&
+                      metadata.icc == back->metadata.icc;
+    if (!LookTheSame(picture, *back)) return Fail(Status::UnsuitableImage, "Its format would change its colors.");
+    if (!kept) return Fail(Status::UnsuitableImage, "Its EXIF, XMP or color profile would be lost.");
+    platform::FileView file;
+    if (!file.Open(working.Path())) return Status::FileOpenError;
+    return WriteUnlessThere(file.Bytes(), false);
+  }
+
+  // What is the same already is copied, but not onto itself.
+  Status WriteUnlessThere(std::span<const uint8_t> bytes, bool same) {
+    if (same && source_ == destination_) return Status::Ok;
+    ByteWriter out;
+    if (!out.Create(destination_)) return Fail(Status::ErrorCreatingFile, "\"" + destination_ + "\" cannot be made.");
+    out.Bytes(bytes);
+    RETURN_IF_BAD(CommitOutput(out, options_));
+    result_.changed = true;
+    return Status::Ok;
+  }
+
+  const std::string &source_, &destination_;
+  const TurnRequest& request_;
+  const WriteOptions& options_;
+  TurnedFile result_;
+};
+
+}  // namespace
+
+TurnedFile TurnPictureFile(const std::string& source, const std::string& destination, const TurnRequest& request,
+                           const WriteOptions& options) {
+  return Turning(source, destination, request, options).Run();
+}
+
+}  // namespace fotomill

@@ -1,0 +1,128 @@
+#include "batch/turn_run.h"
+
+#include <gtest/gtest.h>
+
+#include <filesystem>
+
+#include "formats/jpeg.h"
+#include "formats/png.h"
+#include "formats/webp.h"
+#include "platform/files.h"
+#include "support/bitmaps.h"
+#include "support/codecs.h"
+#include "support/faults.h"
+#include "support/files.h"
+#include "support/hex.h"
+
+namespace fotomill::test {
+namespace {
+
+namespace fs = std::filesystem;
+
+std::vector<std::string> LinesOf(const BatchJob& job) {
+  std::vector<std::string> lines;
+  for (const ProgressLine& line : job.progress.Lines()) lines.push_back(line.text);
+  return lines;
+}
+
+TEST(Turn, FilesChangeOnlyWhereNothingIsLost) {
+  const TemporaryFolder folder;
+  const PicturePointer picture = PatternPicture(32, 16, 24);
+  const struct {
+    const char* name;
+    std::vector<uint8_t> bytes;
+    const char* hint;  // null: it is turned
+  } rows[] = {
+      {"a.jpg", Encode(JpegWrite, *picture), nullptr},
+      {"b.png", Encode(PngWrite, *picture), nullptr},
+      {"c.bmp", BitmapFile(9, 5, 8), nullptr},
+      {"d.webp", Encode(WebpWrite, *picture), nullptr},
+      {"deep.png",
+       Hex("89504E470D0A1A0A0000000D49484452000000010000000110000000006AEE47160000000B49444154789C6310320100005B004796FB1B"
+           "650000000049454E44AE426082"),
+       "It holds finer colors than can be written again."},
+      {"e.gif",
+       Hex("474946383961 0100 0100 800000 000000FFFFFF 2C00000000010001000002024401 00 2C00000000010001000002024C01 00 3B"),
+       "It holds several pictures, of which only one would be left."},
+      {"f.jpg", Hex("FFD8FFD9"), ""},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    const std::string path = folder.Path(row.name);
+    WriteBytes(path, row.bytes);
+    ASSERT_TRUE(platform::SetModificationTime(path, {1'000'000'000, 500}));
+    const TurnRequest right{.turn = Orientation::QuarterRight, .keepTime = true};
+    const TurnedFile turned = TurnPictureFile(path, path, right, {});
+    EXPECT_EQ(platform::FactsOf(path).modified, 1'000'000'000);
+    if (row.hint != nullptr) {
+      EXPECT_NE(turned.status, Status::Ok);
+      EXPECT_EQ(turned.hint, row.hint);
+      EXPECT_EQ(ReadBytes(path), row.bytes);
+      continue;
+    }
+    ASSERT_EQ(turned.status, Status::Ok) << turned.hint;
+    EXPECT_TRUE(turned.note.empty());
+    PicturePointer before, after;
+    WriteBytes(folder.Path(std::string("before-") + row.name), row.bytes);
+    ASSERT_EQ(LoadPicture(folder.Path(std::string("before-") + row.name).c_str(), before), Status::Ok);
+    ASSERT_EQ(LoadPicture(path.c_str(), after), Status::Ok);
+    ASSERT_EQ(after->image.Width(), before->image.Height());
+    if (std::string_view(row.name) == "a.jpg") continue;  // decoding a turned block rounds otherwise
+    for (int32_t x = 0; x < before->image.Width(); ++x) {
+      EXPECT_EQ(before->image.PixelAt(x, 1), after->image.PixelAt(after->image.Width() - 2, x));
+    }
+  }
+}
+
+TEST(Turn, SelectionsKeepTheirNamesAndTheirOldFiles) {
+  const TemporaryFolder folder;
+  const std::vector<uint8_t> bitmap = BitmapFile(9, 5, 24);
+  for (const char* name : {"a.bmp", "b.bmp", "c.bmp"}) WriteBytes(folder.Path(name), bitmap);
+  fs::create_symlink(folder.Path("c.bmp"), folder.Path("link.bmp"));
+  std::vector<BatchFile> files;
+  for (const char* name : {"a.bmp", "b.bmp", "a.bmp", "link.bmp"})
+    files.push_back({.name = folder.Path(name), .below = {}, .hint = {}});
+  TurnFunction function{.request = {.turn = Orientation::HalfTurn}, .inPlace = true};
+  function.keepPrevious = [&](const std::string& path) { return path != folder.Path("b.bmp"); };
+  BatchJob job;
+  ASSERT_EQ(RunTurn(files, function, job), Status::Ok);
+  const std::vector<std::string> lines = LinesOf(job);
+  ASSERT_GE(lines.size(), 4u);
+  EXPECT_EQ(lines[0], folder.Path("a.bmp") + " -> " + folder.Path("a.bmp"));
+  EXPECT_EQ(lines[1], folder.Path("b.bmp") + ": Error creating file. There is no room to keep the old file for undo.");
+  EXPECT_NE(lines[2].find("named twice"), std::string::npos);
+  EXPECT_NE(lines[3].find("It is a link"), std::string::npos);
+  EXPECT_NE(ReadBytes(folder.Path("a.bmp")), bitmap);
+  EXPECT_EQ(ReadBytes(folder.Path("b.bmp")), bitmap);
+  EXPECT_TRUE(fs::is_symlink(folder.Path("link.bmp")));
+  EXPECT_EQ(ReadBytes(folder.Path("c.bmp")), bitmap);
+
+  // Elsewhere outputs keep clear of each other and of what is there; the second turn gives the first picture back.
+  function = {.request = {.turn = Orientation::HalfTurn}};
+  BatchJob other;
+  other.destinationFolder = folder.Path("out");
+  ASSERT_EQ(RunTurn(std::span(files).first(3), function, other), Status::Ok);
+  PicturePointer twice, once;
+  ASSERT_EQ(LoadPicture(folder.Path("out/a.bmp").c_str(), twice), Status::Ok);
+  ASSERT_EQ(LoadPicture(folder.Path("c.bmp").c_str(), once), Status::Ok);
+  EXPECT_TRUE(SamePixels(once->image, twice->image));
+  EXPECT_TRUE(fs::exists(folder.Path("out/a [1].bmp")));
+  // A turn that comes to nothing leaves the file alone.
+  EXPECT_FALSE(TurnPictureFile(folder.Path("c.bmp"), folder.Path("c.bmp"), {}, {}).changed);
+}
+
+TEST(Turn, WhateverFailsTheOldFileIsThere) {
+  const TemporaryFolder folder;
+  const std::string path = folder.Path("a.jpg");
+  const std::vector<uint8_t> file = Encode(JpegWrite, *PatternPicture(32, 16, 24));
+  WriteBytes(path, file);
+  const int64_t faults = ForEachFault([&] {
+    const Status status = TurnPictureFile(path, path, {.turn = Orientation::HalfTurn}, {}).status;
+    EXPECT_EQ(ReadBytes(path) == file, status != Status::Ok);
+    EXPECT_EQ(folder.Names().size(), 1u);
+  });
+  EXPECT_GT(faults, 3);
+}
+
+}  // namespace
+}  // namespace fotomill::test
