@@ -1,8 +1,11 @@
 #include "desktop/view_picture.h"
 
 #include <algorithm>
+#include <cmath>
 
+#include "core/choice_lists.h"
 #include "core/settings.h"
+#include "desktop/browser_model.h"
 #include "desktop/photo_facts.h"
 #include "desktop/rgb_image.h"
 #include "desktop/view_transform.h"
@@ -58,6 +61,11 @@ uint64_t ViewPicture::Bytes() const {
     return image.Bytes().size() + alpha.Bytes().size();
   };
   return kRecordBytes + bytes(fitted.image, fitted.alpha) + (picture == nullptr ? 0 : bytes(picture->image, picture->alpha));
+}
+
+std::string SizeAndZoom(const PictureRecord& picture, double scale) {
+  return std::to_string(picture.image.Width()) + " x " + std::to_string(picture.image.Height()) + " pixels, " +
+         SizeText(picture.fileSize, choice::kSizeFitting) + ", " + std::to_string(std::lround(scale * 100)) + "%";
 }
 
 ViewPicturePointer LoadViewPicture(const ViewWish& wish) {

@@ -50,6 +50,9 @@ struct ViewPicture {
 };
 using ViewPicturePointer = std::shared_ptr<const ViewPicture>;
 
+// "4000 x 3000 pixels, 3.2 MB, 25%" of a picture at a scale.
+std::string SizeAndZoom(const PictureRecord& picture, double scale);
+
 ViewPicturePointer LoadViewPicture(const ViewWish& wish);
 
 // Decodes pictures ahead on a thread of its own, and keeps those that are wanted up to a number of bytes.

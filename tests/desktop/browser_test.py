@@ -1,6 +1,6 @@
 #!/usr/bin/env python3
 """The browser and the view window of the real program, by keyboard."""
-from driven_desktop import Desktop, make_pictures, run
+from driven_desktop import Desktop, Failure, make_pictures, run
 
 NAMES = ["a1.bmp", "a2.png", "a10.jpg", "b.tif"]
 
@@ -98,4 +98,41 @@ def open_select_view(folder):
         desktop.wait_end()
 
 
-run(open_select_view)
+def compare(folder):
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["a.bmp", "b.png", "c.jpg"])
+    (pictures / "d.gif").write_bytes(b"GIF89a and no more")
+    with Desktop(folder, pictures) as desktop:
+        desktop.wait(r"browser .*items=4 .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+a")
+        desktop.wait(r"selected=4")
+        desktop.key("ctrl+shift+Return")
+        for pane in (r"1/4 status=0 .*a.bmp", r"2/4 status=0 .*b.png", r"3/4 status=0 .*c.jpg", r"4/4 status=3 .*d.gif"):
+            desktop.wait("compare pane=" + pane)
+        desktop.focus("Compare")
+        # Joined panes zoom together, others alone.
+        desktop.key("plus")
+        desktop.wait(r"compare-zoom joined=1 125% 125% 125%")
+        desktop.key("j", "Tab")
+        desktop.wait(r"compare-focus 2/4")
+        desktop.key("1")
+        desktop.wait(r"compare-zoom joined=0 125% 100% 125%")
+        desktop.key("shift+Tab", "3", "j")
+        desktop.wait(r"compare-focus 1/4")
+        desktop.wait(r"compare-zoom joined=1 (\d+%) \1 \1")
+        desktop.screenshot("compare")
+        desktop.key("Tab", "Tab", "Delete")
+        desktop.wait(r"compare-focus 3/3")
+        desktop.wait(r"files Deletion of c.jpg done=1")
+        if (pictures / "c.jpg").exists():
+            raise Failure("c.jpg is still there")
+        for name in ("d.gif", "b.png", "a.bmp"):  # with the last pane the window goes
+            desktop.key("Delete")
+            desktop.wait(f"files Deletion of {name} done=1")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+q")
+        desktop.wait_end()
+
+
+run(open_select_view, compare)

@@ -3,6 +3,7 @@
 #include "core/choice_lists.h"
 #include "desktop/windows/batch_runner.h"
 #include "desktop/windows/command_finder.h"
+#include "desktop/windows/compare_frame.h"
 #include "desktop/windows/file_actions.h"
 #include "desktop/windows/main_frame.h"
 #include "desktop/windows/sequential_rename_dialog.h"
@@ -159,6 +160,7 @@ constexpr Command kCommands[] = {
     {kGo, "Pre&vious tab",         "Ctrl+PageUp",  "Goes to the previous tab.", Needs::Nothing, PreviousTab},
 
     {kFunctions, "&View",          "Ctrl+Return",  "Shows the focused picture in a view window.", Needs::Files, View, "view", true},
+    {kFunctions, "Com&pare",       "Ctrl+Shift+Return", "Shows two to four selected pictures beside each other.", Needs::Few, CompareSelection, nullptr, true},
     {kFunctions, "&Convert...",    "Ctrl+E",       "Writes the selected pictures in another format.", Needs::Files, ConvertSelection, "convert", true},
     {kFunctions, "&Get info...",   "Alt+Return",   "Tells what the selected files hold.", Needs::Files, ShowInfo, "info", true},
     {kFunctions, "E&XIF...",       "Alt+Shift+Return", "Shows what the camera wrote into the focused picture.", Needs::Files, ShowExif, "exif", true},

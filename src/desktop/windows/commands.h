@@ -12,6 +12,7 @@ class MainFrame;
 enum class Needs {
   Nothing,
   Files,  // at least one file selected or focused
+  Few,    // two to four files
   Item,   // at least one file or folder
   Undo,   // something to take back; the menu item then names it
   Redo,

@@ -111,6 +111,21 @@ void FileActions::Trash(const std::vector<std::string>& paths) {
   Do(DeedKind::Trash, paths, {});
 }
 
+bool FileActions::TrashFromView(wxWindow* view, const std::string& path) {
+  if (busy_) {
+    wxBell();
+    return false;
+  }
+  if (settings.PromptDeleteFromView != 0) {
+    wxMessageDialog dialog(view, "Move " + Shown(platform::FileNameOf(path)) + " to the trash?", "Delete",
+                           wxOK | wxCANCEL | wxICON_QUESTION);
+    dialog.SetOKLabel("&Delete");
+    if (dialog.ShowModal() != wxID_OK) return false;
+  }
+  Trash({path});
+  return true;
+}
+
 void FileActions::Delete(const std::vector<std::string>& paths) {
   if (paths.empty()) return;
   const wxString what = paths.size() == 1 ? "\"" + Shown(platform::FileNameOf(paths.front())) + "\"" : Shown(Count(paths.size()));

@@ -22,6 +22,9 @@ class FileActions : public wxEvtHandler {
   ~FileActions() override;
 
   void Trash(const std::vector<std::string>& paths);
+  // The same of a file that `view` shows; asks first if PromptDeleteFromView wants it. False when the answer was no, or
+  // other files are in work.
+  bool TrashFromView(wxWindow* view, const std::string& path);
   // Asks first.
   void Delete(const std::vector<std::string>& paths);
   void CopyTo(const std::vector<std::string>& paths, const std::string& folder);

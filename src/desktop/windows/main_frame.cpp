@@ -16,6 +16,7 @@
 #include "desktop/windows/batch_runner.h"
 #include "desktop/windows/bitmaps.h"
 #include "desktop/windows/commands.h"
+#include "desktop/windows/compare_frame.h"
 #include "desktop/windows/file_actions.h"
 #include "desktop/windows/folder_drop.h"
 #include "desktop/windows/folder_tree.h"
@@ -126,6 +127,7 @@ bool MainFrame::Enabled(const Command& command) const {
   const BrowserPage* browser = Browser();
   switch (command.needs) {
     case Needs::Files: return browser != nullptr && browser->Model().HasFileForFunction();
+    case Needs::Few: return browser != nullptr && CompareFrame::Takes(browser->Model().Selected().SelectedCount());
     case Needs::Item: return browser != nullptr && browser->Model().HasPathForFunction();
     case Needs::ClosedTab: return HasClosedTab();
     case Needs::Undo: return files_->Undoable().CanUndo() && !files_->Busy();

@@ -77,23 +77,49 @@ void ViewCanvas::SetOverlay(const std::vector<std::string>& lines) {
 void ViewCanvas::ZoomBy(double factor) {
   const wxSize size = DeviceSize();
   transform_.ZoomBy(factor, size.x / 2.0, size.y / 2.0);
-  TransformChanged();
+  UserZoomed();
 }
 
 void ViewCanvas::ZoomActual() {
   transform_.ZoomToMiddle(1);
-  TransformChanged();
+  UserZoomed();
 }
 
 void ViewCanvas::SetZoom(ZoomMode mode) {
   transform_.SetMode(mode);
-  TransformChanged();
+  UserZoomed();
 }
 
 void ViewCanvas::PanBy(int stepsAcross, int stepsDown) {
   const wxSize size = DeviceSize();
   transform_.Pan(-static_cast<double>(stepsAcross) * size.x / kPanSteps, -static_cast<double>(stepsDown) * size.y / kPanSteps);
+  UserPanned();
+}
+
+bool ViewCanvas::PanByKey(int key) {
+  if (!CanPan()) return false;
+  switch (key) {
+    case WXK_LEFT: PanBy(-1, 0); return true;
+    case WXK_RIGHT: PanBy(1, 0); return true;
+    case WXK_UP: PanBy(0, -1); return true;
+    case WXK_DOWN: PanBy(0, 1); return true;
+    default: return false;
+  }
+}
+
+void ViewCanvas::SetPlace(const ViewPlace& place) {
+  transform_.SetPlace(place);
+  TransformChanged();
+}
+
+void ViewCanvas::UserZoomed() {
+  TransformChanged();
+  if (events_.placed) events_.placed();
+}
+
+void ViewCanvas::UserPanned() {
   Refresh();
+  if (events_.placed) events_.placed();
 }
 
 // The picture is drawn at once from what there is; a smaller scale then gets pixels that are made for it.
@@ -191,7 +217,7 @@ void ViewCanvas::OnWheel(wxMouseEvent& event) {
   const wxPoint place = event.GetPosition() * GetContentScaleFactor();
   const double steps = static_cast<double>(event.GetWheelRotation()) / event.GetWheelDelta();
   transform_.ZoomBy(std::pow(ViewTransform::kStep, steps), place.x, place.y);
-  TransformChanged();
+  UserZoomed();
 }
 
 void ViewCanvas::OnLeftDown(wxMouseEvent& event) {
@@ -210,14 +236,14 @@ void ViewCanvas::OnMotion(wxMouseEvent& event) {
   const wxPoint way = (event.GetPosition() - drag_) * GetContentScaleFactor();
   drag_ = event.GetPosition();
   transform_.Pan(way.x, way.y);
-  Refresh();
+  UserPanned();
 }
 
 void ViewCanvas::OnDoubleClick(wxMouseEvent& event) {
   if (transform_.Mode() == ZoomMode::Free) return SetZoom(ZoomMode::Fit);
   const wxPoint place = event.GetPosition() * GetContentScaleFactor();
   transform_.ZoomTo(1, place.x, place.y);
-  TransformChanged();
+  UserZoomed();
 }
 
 }  // namespace fotomill::desktop

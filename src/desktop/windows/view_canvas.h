@@ -19,9 +19,10 @@ class ViewCanvas : public wxWindow {
  public:
   // What it tells its window. Keys, right clicks and movements of the pointer are events of the canvas.
   struct Events {
-    std::function<void()> resized;  // pictures are to fit another size
-    std::function<void()> changed;  // another picture or zoom
-    std::function<void()> painted;  // a picture, not what stands in for it
+    std::function<void()> resized;           // pictures are to fit another size
+    std::function<void()> changed;           // another picture or zoom
+    std::function<void()> painted;           // a picture, not what stands in for it
+    std::function<void()> placed = nullptr;  // zoomed or moved by the user
   };
 
   ViewCanvas(wxWindow* parent, Events events);
@@ -45,6 +46,11 @@ class ViewCanvas : public wxWindow {
   bool CanPan() const { return transform_.CanPan(); }
   // By eighths of the window.
   void PanBy(int stepsAcross, int stepsDown);
+  // Arrows move a picture that is larger than the window. False for other keys, and where all of it is seen.
+  bool PanByKey(int key);
+  // Zoom and place, to be taken from one canvas to others.
+  ViewPlace Place() const { return transform_.Place(); }
+  void SetPlace(const ViewPlace& place);
 
   // Pixels of the screen.
   wxSize DeviceSize() const { return GetClientSize() * GetContentScaleFactor(); }
@@ -62,6 +68,8 @@ class ViewCanvas : public wxWindow {
   void PaintOverlay(wxDC& dc) const;
   void ZoomBy(double factor);
   void TransformChanged();
+  void UserZoomed();
+  void UserPanned();
   void ScaledCame();
   bool Showable() const { return picture_ != nullptr && picture_->picture != nullptr; }
   ViewSource BestSource() const;

@@ -2,9 +2,6 @@
 
 #include <wx/defs.h>
 
-#include <algorithm>
-
-#include "core/settings.h"
 #include "desktop/windows/view_frame.h"
 
 namespace fotomill::desktop {
@@ -31,21 +28,15 @@ template <void (ViewCanvas::*action)()>
 void OfCanvas(ViewFrame& view) {
   (view.Canvas().*action)();
 }
-// A setting that is on or off.
 template <int32_t Settings::*setting>
-void Switch(ViewFrame& view) {
-  settings.*setting = settings.*setting == 0 ? 1 : 0;
-  view.SettingSwitched();
-}
+constexpr auto Switch = SwitchSetting<ViewFrame, setting>;
 template <int32_t Settings::*setting>
-bool IsOn() {
-  return settings.*setting != 0;
-}
+constexpr auto IsOn = SettingIsOn<ViewFrame, setting>;
 void First(ViewFrame& view) { view.GoTo(0); }
 void Last(ViewFrame& view) { view.GoTo(view.LastPlace()); }
 
 // clang-format off
-constexpr ViewCommand kCommands[] = {
+constexpr KeyCommand<ViewFrame> kCommands[] = {
     {"&Next",             "Space",     {WXK_SPACE, WXK_PAGEDOWN, 'N'},  Step<1>},
     {"&Previous",         "Backspace", {WXK_BACK, WXK_PAGEUP, 'P'},     Step<-1>},
     {"&First",            "Home",      {WXK_HOME},                      First},
@@ -77,12 +68,6 @@ constexpr ViewCommand kCommands[] = {
 
 }  // namespace
 
-std::span<const ViewCommand> ViewCommands() { return kCommands; }
-
-const ViewCommand* ViewCommandOfKey(int key) {
-  const auto has = [key](const ViewCommand& command) { return std::ranges::find(command.keys, key) != std::end(command.keys); };
-  const auto* found = key == 0 ? std::end(kCommands) : std::ranges::find_if(kCommands, has);
-  return found == std::end(kCommands) ? nullptr : found;
-}
+std::span<const KeyCommand<ViewFrame>> ViewCommands() { return kCommands; }
 
 }  // namespace fotomill::desktop

@@ -1,14 +1,11 @@
 #include "desktop/windows/view_frame.h"
 
 #include <wx/clipbrd.h>
-#include <wx/menu.h>
-#include <wx/msgdlg.h>
 
 #include <algorithm>
 #include <cmath>
 
 #include "catalog/file_history.h"
-#include "core/choice_lists.h"
 #include "core/configuration.h"
 #include "core/settings.h"
 #include "core/text.h"
@@ -178,8 +175,7 @@ std::string ViewFrame::StatusLine() const {
   if (!IsCurrent(shown)) return line + ", loading...";
   if (shown->picture == nullptr) return line + ", " + std::string(StatusMessage(shown->status));
   const PictureRecord& picture = *shown->picture;
-  line += ", " + std::to_string(picture.image.Width()) + " x " + std::to_string(picture.image.Height()) + " pixels, " +
-          SizeText(picture.fileSize, choice::kSizeFitting) + ", " + std::to_string(std::lround(canvas_->Zoom() * 100)) + "%";
+  line += ", " + SizeAndZoom(picture, canvas_->Zoom());
   if (picture.pageCount > 1) line += ", page " + std::to_string(page_ + 1) + " of " + std::to_string(picture.pageCount);
   return line;
 }
@@ -242,13 +238,7 @@ void ViewFrame::Leave() {
 
 void ViewFrame::DeleteFile() {
   const std::string path = list_[place_];
-  if (settings.PromptDeleteFromView != 0) {
-    wxMessageDialog dialog(this, "Move " + Shown(platform::FileNameOf(path)) + " to the trash?", "Delete",
-                           wxOK | wxCANCEL | wxICON_QUESTION);
-    dialog.SetOKLabel("&Delete");
-    if (dialog.ShowModal() != wxID_OK) return;
-  }
-  frame_.Files().Trash({path});
+  if (!frame_.Files().TrashFromView(this, path)) return;
   loader_->Forget(path);
   list_.erase(list_.begin() + static_cast<std::ptrdiff_t>(place_));
   if (list_.empty()) {
@@ -277,48 +267,19 @@ void ViewFrame::CopyPicture() {
 
 void ViewFrame::OnKey(wxKeyEvent& event) {
   const int key = event.GetKeyCode();
-  if (PanByKey(key)) return;
+  if (canvas_->PanByKey(key)) return;
   if (key == WXK_LEFT || key == WXK_UP) return Step(-1);
   if (key == WXK_RIGHT || key == WXK_DOWN) return Step(1);
   if (event.AltDown() && key == WXK_RETURN) return ShowInfoWindow();
   if (event.AltDown()) return event.Skip();
   const int typed = event.ControlDown() ? (key == 'C' ? static_cast<int>(WXK_CONTROL_C) : 0) : key;
-  if (const ViewCommand* command = ViewCommandOfKey(typed)) return command->run(*this);
+  if (const KeyCommand<ViewFrame>* command = CommandOfKey(ViewCommands(), typed)) return command->run(*this);
   event.Skip();
-}
-
-// Arrows move a picture that is larger than the window.
-bool ViewFrame::PanByKey(int key) {
-  if (!canvas_->CanPan()) return false;
-  switch (key) {
-    case WXK_LEFT: canvas_->PanBy(-1, 0); return true;
-    case WXK_RIGHT: canvas_->PanBy(1, 0); return true;
-    case WXK_UP: canvas_->PanBy(0, -1); return true;
-    case WXK_DOWN: canvas_->PanBy(0, 1); return true;
-    default: return false;
-  }
 }
 
 void ViewFrame::ShowMenu(const wxPoint& place) {
   if (settings.RightClickMenuInView == 0) return;
-  wxMenu menu;
-  int id = wxID_HIGHEST + 1;
-  for (const ViewCommand& command : ViewCommands()) {
-    if (command.text == nullptr) {
-      menu.AppendSeparator();
-      continue;
-    }
-    // The key is shown beside the text only: keys are the canvas's.
-    const wxString text = wxString(command.text) + "    " + command.shownKey;
-    if (command.checked == nullptr) {
-      menu.Append(++id, text);
-    } else {
-      menu.AppendCheckItem(++id, text)->Check(command.checked());
-    }
-    menu.Bind(
-        wxEVT_MENU, [this, run = command.run](wxCommandEvent&) { run(*this); }, id);
-  }
-  canvas_->PopupMenu(&menu, place);
+  ShowCommandMenu(ViewCommands(), *this, *canvas_, place);
 }
 
 }  // namespace fotomill::desktop

@@ -49,7 +49,6 @@ class ViewFrame : public wxFrame {
   std::vector<std::string> OverlayLines() const;
   void HidePointerLater();
   void OnKey(wxKeyEvent& event);
-  bool PanByKey(int key);
   void ShowMenu(const wxPoint& place);
   void LogPaint();
 
