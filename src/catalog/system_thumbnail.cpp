@@ -16,7 +16,6 @@ namespace fotomill {
 
 namespace {
 
-constexpr int32_t kLongestSide = 256;
 constexpr std::string_view kUriKey = "Thumb::URI", kTimeKey = "Thumb::MTime";
 constexpr std::string_view kAllowedMarks = "-_.!~*'():@&=+$,/";
 
@@ -65,17 +64,22 @@ std::string FileUri(std::string_view path) {
   return uri;
 }
 
-bool ReadSystemThumbnail(const std::string& picturePath, LargeThumbnailRecord& record) {
+PicturePointer ReadSystemPicture(const std::string& picturePath) {
   const platform::FileFacts facts = platform::FactsOf(picturePath);
-  if (facts.kind != platform::FileKind::Regular) return false;
+  if (facts.kind != platform::FileKind::Regular) return nullptr;
   const std::string uri = FileUri(platform::AbsolutePath(picturePath));
   const std::string path = CachedFile(uri);
   platform::FileView file;
-  if (path.empty() || !file.Open(path) || !IsOf(file.Bytes(), uri, facts.modified)) return false;
-  const PicturePointer picture = NewPictureRecord();
-  if (picture == nullptr || DescribePng(file.Bytes(), *picture) != Status::Ok) return false;
-  if (std::max(picture->width, picture->height) > kLongestSide) return false;
-  return DecodePng(file.Bytes(), *picture) == Status::Ok && MakeLargeThumbnailRecord(record, *picture);
+  if (path.empty() || !file.Open(path) || !IsOf(file.Bytes(), uri, facts.modified)) return nullptr;
+  PicturePointer picture = NewPictureRecord();
+  if (picture == nullptr || DescribePng(file.Bytes(), *picture) != Status::Ok) return nullptr;
+  if (std::max(picture->width, picture->height) > kSystemThumbnailSide) return nullptr;
+  return DecodePng(file.Bytes(), *picture) == Status::Ok ? std::move(picture) : nullptr;
+}
+
+bool ReadSystemThumbnail(const std::string& picturePath, LargeThumbnailRecord& record) {
+  const PicturePointer picture = ReadSystemPicture(picturePath);
+  return picture != nullptr && MakeLargeThumbnailRecord(record, *picture);
 }
 
 }  // namespace fotomill

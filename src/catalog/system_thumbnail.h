@@ -15,6 +15,11 @@ namespace fotomill {
 // The address of an absolute path, every byte escaped that RFC 2396 does not allow in one.
 std::string FileUri(std::string_view path);
 
+inline constexpr int32_t kSystemThumbnailSide = 256;
+
+// The system's thumbnail of a picture as a record of its own, null when there is none that is valid.
+PicturePointer ReadSystemPicture(const std::string& picturePath);
+
 // Fills a large record with the system's thumbnail of a picture. False when there is none that is valid; `record` is
 // then as before.
 bool ReadSystemThumbnail(const std::string& picturePath, LargeThumbnailRecord& record);

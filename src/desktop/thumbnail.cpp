@@ -5,10 +5,14 @@
 #include <utility>
 #include <vector>
 
+#include "catalog/system_thumbnail.h"
 #include "catalog/thumbnail_database.h"
 #include "catalog/thumbnail_file.h"
 #include "core/choice_lists.h"
 #include "core/settings.h"
+#include "metadata/exif_source.h"
+#include "metadata/exif_thumbnail.h"
+#include "metadata/exif_walk.h"
 #include "picture/registry.h"
 #include "platform/files.h"
 #include "platform/paths.h"
@@ -83,20 +87,49 @@ bool FindRecord(const ThumbnailWish& wish, ThumbnailRecord& record) {
   return InDatabase(wish) && openDatabase.Find(wish, record);
 }
 
-Status PixelsOfRecord(const ThumbnailRecord& record, RgbImage& pixels) {
-  PackedImage bitmap;
-  RETURN_IF_BAD(ThumbnailRecordToBitmap(record, bitmap));
-  RETURN_IF_BAD(ToRgb(bitmap, pixels));
-  pixels = WithoutMatte(pixels, static_cast<Color>(settings.ThumbnailMatte));
-  return Status::Ok;
-}
-
 Status ScaleDown(const PackedImage& image, int32_t side, RgbImage& pixels) {
   if (image.Width() <= side && image.Height() <= side) return ToRgb(image, pixels);
   PackedImage scaled, noAlpha, noScaledAlpha;
   RETURN_IF_BAD(
       ScaleFiltered(image, noAlpha, FitSize(image.Width(), image.Height(), side), ScaleFilter::Bicubic, scaled, noScaledAlpha));
   return ToRgb(scaled, pixels);
+}
+
+Status PixelsOfRecord(const ThumbnailRecord& record, int32_t side, RgbImage& pixels) {
+  PackedImage bitmap;
+  RETURN_IF_BAD(ThumbnailRecordToBitmap(record, bitmap));
+  RETURN_IF_BAD(ToRgb(bitmap, pixels));
+  pixels = WithoutMatte(pixels, static_cast<Color>(settings.ThumbnailMatte));
+  if (std::max(pixels.width, pixels.height) <= side) return Status::Ok;
+  RETURN_IF_BAD(ToPacked(pixels, bitmap));
+  return ScaleDown(bitmap, side, pixels);
+}
+
+Status PixelsOfPicture(PictureRecord& picture, int32_t side, RgbImage& pixels) {
+  RETURN_IF_BAD(PrepareForDisplay(picture, static_cast<Color>(settings.ThumbnailMatte)));
+  return ScaleDown(picture.image, side, pixels);
+}
+
+// A thumbnail that somebody has made before.
+bool TakeReady(const ThumbnailWish& wish, Thumbnail& thumbnail) {
+  ThumbnailRecord record;
+  if (FindRecord(wish, record) && PixelsOfRecord(record, wish.side, thumbnail.pixels) == Status::Ok) return true;
+  const bool fromSystem = wish.mode == choice::kDiskBased && settings.UseWindowsThumbnailCache != 0 &&
+                          wish.side > kSmallThumbnailSide && wish.side <= kSystemThumbnailSide;
+  const PicturePointer picture = fromSystem ? ReadSystemPicture(wish.path) : nullptr;
+  return picture != nullptr && PixelsOfPicture(*picture, wish.side, thumbnail.pixels) == Status::Ok;
+}
+
+// The thumbnail in the file's EXIF, upright as the picture would be.
+bool TakeEmbedded(const ThumbnailWish& wish, Thumbnail& thumbnail) {
+  ExifSource source;
+  ExifFindings findings;
+  if (source.Open(wish.path.c_str()) != Status::Ok || !WalkExif(source.Block(), nullptr, &findings)) return false;
+  PicturePointer picture;
+  if (DecodeExifThumbnail(ExifThumbnail(source.Block(), findings), picture) != Status::Ok) return false;
+  picture->metadata.exif.assign(source.Block().begin(), source.Block().end());
+  thumbnail.standIn = true;
+  return PixelsOfPicture(*picture, wish.side, thumbnail.pixels) == Status::Ok && source.Intact();
 }
 
 Status MakeFromPicture(const ThumbnailWish& wish, Thumbnail& thumbnail) {
@@ -120,15 +153,14 @@ Status MakeFromPicture(const ThumbnailWish& wish, Thumbnail& thumbnail) {
 
 ThumbnailPointer LoadThumbnail(const ThumbnailWish& wish) {
   auto thumbnail = std::make_shared<Thumbnail>();
-  ThumbnailRecord record;
-  if (FindRecord(wish, record)) {
-    thumbnail->status = PixelsOfRecord(record, thumbnail->pixels);
-    if (thumbnail->status == Status::Ok) return thumbnail;
-  }
+  if (TakeReady(wish, *thumbnail)) return thumbnail;
+  if (wish.standIn) return TakeEmbedded(wish, *thumbnail) ? thumbnail : nullptr;
   thumbnail->status = MakeFromPicture(wish, *thumbnail);
   if (thumbnail->status != Status::Ok) thumbnail->pixels = {};
   return thumbnail;
 }
+
+bool MayHoldThumbnail(int32_t format) { return format != kNoFormat && KeepsMetadata(FormatRow(format)); }
 
 void KeepThumbnailRecords() { openDatabase.Flush(); }
 

@@ -24,7 +24,7 @@ ThumbnailLoader::~ThumbnailLoader() {
 void ThumbnailLoader::Want(std::vector<ThumbnailWish> wishes) {
   {
     const std::lock_guard lock(mutex_);
-    std::erase_if(wishes, [this](const ThumbnailWish& wish) { return inWork_.contains(wish.path); });
+    std::erase_if(wishes, [this](const ThumbnailWish& wish) { return std::ranges::find(inWork_, wish) != inWork_.end(); });
     std::reverse(wishes.begin(), wishes.end());
     wishes_ = std::move(wishes);
   }
@@ -48,11 +48,15 @@ void ThumbnailLoader::Work() {
     if (stop_) return;
     ThumbnailWish wish = std::move(wishes_.back());
     wishes_.pop_back();
-    inWork_.insert(wish.path);
+    inWork_.push_back(wish);
     lock.unlock();
     ThumbnailPointer thumbnail = load_(wish);
     lock.lock();
-    inWork_.erase(wish.path);
+    inWork_.erase(std::ranges::find(inWork_, wish));
+    if (wish.standIn && thumbnail != nullptr && !thumbnail->standIn) {
+      wish.standIn = false;
+      std::erase(wishes_, wish);
+    }
     const bool tell = results_.empty() && !stop_;
     results_.push_back({std::move(wish), std::move(thumbnail)});
     const bool last = wishes_.empty() && inWork_.empty();

@@ -8,14 +8,15 @@
 #include <string>
 #include <thread>
 #include <unordered_map>
-#include <unordered_set>
 #include <vector>
 
 #include "desktop/thumbnail.h"
 
 namespace fotomill::desktop {
 
-// Loads thumbnails on worker threads, in the order in which they are wanted now.
+// Loads thumbnails on worker threads, in the order in which they are wanted now. The wish of a result tells whether it is a
+// stand-in; its thumbnail is null when there is none. Where a stand-in was wanted and the proper one was ready, nobody loads it
+// again.
 class ThumbnailLoader {
  public:
   struct Result {
@@ -47,7 +48,7 @@ class ThumbnailLoader {
   mutable std::mutex mutex_;
   std::condition_variable wanted_;
   std::vector<ThumbnailWish> wishes_;  // the most urgent last
-  std::unordered_set<std::string> inWork_;
+  std::vector<ThumbnailWish> inWork_;  // one a worker
   std::vector<Result> results_;
   bool stop_ = false;
   std::vector<std::thread> workers_;

@@ -11,9 +11,12 @@
 #include "desktop/view_drawing.h"
 #include "desktop/view_picture.h"
 #include "desktop/view_transform.h"
+#include "metadata/exif_edit.h"
 #include "picture/registry.h"
+#include "support/codecs.h"
 #include "support/exif_blocks.h"
 #include "support/files.h"
+#include "support/hex.h"
 
 namespace fotomill::desktop {
 namespace {
@@ -210,6 +213,33 @@ TEST(Thumbnail, DatabaseModesKeepWhatTheyMade) {
   }
   wish = {folder.Path("none.bmp"), 1, 1, 96, choice::kLocalDatabase};
   EXPECT_EQ(LoadThumbnail(wish)->status, Status::FileOpenError);
+}
+
+// A stand-in is the file's own thumbnail, upright as the picture is; where there is none, nothing is decoded.
+TEST(Thumbnail, StandInsComeFromTheExif) {
+  const test::TemporaryFolder folder;
+  const std::string small = folder.Path("small.jpg"), large = folder.Path("large.jpg"), plain = folder.Path("plain.bmp");
+  ASSERT_EQ(WritePicture(*test::PatternPicture(16, 12, 24), small, {}), Status::Ok);
+  const PicturePointer picture = test::PatternPicture(400, 300, 24);
+  picture->metadata.exif = test::Hex("49492A00 08000000 0100 1201 0300 01000000 06000000 00000000");  // to be turned right
+  ASSERT_TRUE(ReplaceExifThumbnail(picture->metadata.exif, test::ReadBytes(small), 65527));
+  ASSERT_EQ(WritePicture(*picture, large, {}), Status::Ok);
+  std::filesystem::copy_file(test::SourcePath("samples/bmp-true-colour.bmp"), plain);
+  ThumbnailWish wish{large, 1, 1, 176, choice::kDiskBased, true};
+  const ThumbnailPointer standIn = LoadThumbnail(wish);
+  ASSERT_NE(standIn, nullptr);
+  EXPECT_TRUE(standIn->standIn);
+  EXPECT_EQ(standIn->pixels.width, 12);
+  wish.standIn = false;
+  EXPECT_EQ(LoadThumbnail(wish)->pixels.height, 176);
+  wish = {plain, 1, 1, 96, choice::kDiskBased, true};
+  EXPECT_EQ(LoadThumbnail(wish), nullptr);
+  ASSERT_EQ(WriteThumbnail(plain), Status::Ok);
+  wish.side = 48;
+  const ThumbnailPointer ready = LoadThumbnail(wish);  // the proper one, smaller than its record
+  ASSERT_NE(ready, nullptr);
+  EXPECT_FALSE(ready->standIn);
+  EXPECT_EQ(ready->pixels.width, 48);
 }
 
 std::mutex gate;

@@ -129,8 +129,8 @@ ThumbnailWish ThumbnailCanvas::WishOf(size_t line) const {
   return wish;
 }
 
-// What is visible first, then a screen ahead in the direction of scrolling, then the rest from there on, if it is to be
-// made before anybody looks at it.
+// Stand-ins for what is visible first, then the thumbnails themselves, then a screen ahead in the direction of scrolling, then
+// the rest from there on, if it is to be made before anybody looks at it.
 void ThumbnailCanvas::WantThumbnails() {
   std::vector<ThumbnailWish> wishes;
   const auto want = [&](size_t first, size_t end) {
@@ -145,6 +145,7 @@ void ThumbnailCanvas::WantThumbnails() {
     const int height = GetClientSize().y;
     const CellLayout::Range visible = layout_.Visible(scroll_);
     want(visible.first, visible.end);
+    const std::vector<ThumbnailWish> standIns = StandInsFor(wishes);
     const int64_t ahead = direction_ > 0 ? scroll_ + height : std::max<int64_t>(scroll_ - height, 0);
     const CellLayout::Range next = layout_.LinesBetween(ahead, ahead + height);
     if (direction_ > 0) want(std::max(next.first, visible.end), next.end);
@@ -152,16 +153,33 @@ void ThumbnailCanvas::WantThumbnails() {
     if (settings.BrowserThumbnailPrecacheEnable != 0) {
       for (size_t line = visible.end; line < model_.LineCount() && wishes.size() < kPrecache; ++line) want(line, line + 1);
     }
+    wishes.insert(wishes.begin(), standIns.begin(), standIns.end());
   }
   thumbnails_.Want(std::move(wishes));
+}
+
+std::vector<ThumbnailWish> ThumbnailCanvas::StandInsFor(const std::vector<ThumbnailWish>& wishes) const {
+  std::vector<ThumbnailWish> standIns;
+  for (const ThumbnailWish& wish : wishes) {
+    if (thumbnails_.FindAny(wish.path) != nullptr || !MayHoldThumbnail(FindFormatByName(wish.path))) continue;
+    standIns.push_back(wish);
+    standIns.back().standIn = true;
+  }
+  return standIns;
 }
 
 void ThumbnailCanvas::ThumbnailsCame(const std::vector<ThumbnailLoader::Result>& results) {
   std::unordered_set<std::string> visible;
   const CellLayout::Range range = layout_.Visible(scroll_);
-  for (size_t line = range.first; line < range.end; ++line) visible.insert(model_.PathOfLine(line));
+  size_t empty = 0;
+  for (size_t line = range.first; line < range.end; ++line) {
+    visible.insert(model_.PathOfLine(line));
+    if (!model_.Line(line).folder && thumbnails_.FindAny(model_.PathOfLine(line)) == nullptr) ++empty;
+  }
   const auto shows = [&](const ThumbnailLoader::Result& result) { return visible.contains(result.wish.path); };
   if (std::any_of(results.begin(), results.end(), shows)) Refresh();
+  if (empty == 0 && filled_ != model_.Folder()) LogEvent("filled", std::to_string(visible.size()));
+  if (empty == 0) filled_ = model_.Folder();
   if (thumbnails_.Pending() == 0) WantThumbnails();
 }
 
@@ -272,18 +290,19 @@ void ThumbnailCanvas::DrawPicture(wxDC& dc, size_t line, const wxRect& square, c
   }
   const wxBitmap& bitmap = BitmapOfThumbnail(thumbnail);
   if (!bitmap.IsOk()) return DrawPlaceholder(dc, item, square, "!", looks);
-  // One of another size stands in until the right one comes.
-  double shrink = 1;
+  // One of another size, or the file's own, stands in until the right one comes.
+  double scale = 1;
   const wxSize size =
       wxSize(static_cast<int>(std::lround(bitmap.GetLogicalWidth())), static_cast<int>(std::lround(bitmap.GetLogicalHeight())));
-  if (!right) shrink = std::min(1.0, static_cast<double>(square_) / std::max({size.x, size.y, 1}));
-  const wxSize shown(std::max(static_cast<int>(size.x * shrink), 1), std::max(static_cast<int>(size.y * shrink), 1));
+  if (!right) scale = static_cast<double>(square_) / std::max({size.x, size.y, 1});
+  if (!right && !thumbnail->standIn) scale = std::min(scale, 1.0);
+  const wxSize shown(std::max(static_cast<int>(size.x * scale), 1), std::max(static_cast<int>(size.y * scale), 1));
   const wxPoint corner(square.x + (square.width - shown.x) / 2, square.y + (square.height - shown.y) / 2);
-  if (shrink == 1) {
+  if (scale == 1) {
     dc.DrawBitmap(bitmap, corner);
   } else {
-    dc.SetUserScale(shrink, shrink);
-    dc.DrawBitmap(bitmap, static_cast<int>(corner.x / shrink), static_cast<int>(corner.y / shrink));
+    dc.SetUserScale(scale, scale);
+    dc.DrawBitmap(bitmap, static_cast<int>(corner.x / scale), static_cast<int>(corner.y / scale));
     dc.SetUserScale(1, 1);
   }
   dc.SetPen(wxPen(looks.frame));

@@ -68,6 +68,7 @@ class ThumbnailCanvas : public wxWindow {
   wxString CutName(wxDC& dc, const std::string& name, int width);
   const wxBitmap& BitmapOfThumbnail(const ThumbnailPointer& thumbnail);
   ThumbnailWish WishOf(size_t line) const;
+  std::vector<ThumbnailWish> StandInsFor(const std::vector<ThumbnailWish>& wishes) const;
   size_t LineAt(const wxPoint& point) const;
   void MoveFocus(Step step, const wxKeyEvent& event);
   void TellFocus();
@@ -84,7 +85,8 @@ class ThumbnailCanvas : public wxWindow {
   int direction_ = 1;  // of scrolling: what is ahead is loaded first
   int square_ = 96;    // the picture's place in a cell, 0 where there is none
   int textHeight_ = 16;
-  int painted_ = 0;  // 1: anything, 2: files
+  int painted_ = 0;     // 1: anything, 2: files
+  std::string filled_;  // the folder of which every visible cell has shown a picture
 
   struct Drawn {
     ThumbnailPointer thumbnail;

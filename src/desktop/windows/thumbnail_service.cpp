@@ -18,7 +18,11 @@ ThumbnailService::~ThumbnailService() {
 
 void ThumbnailService::TakeResults() {
   const std::vector<ThumbnailLoader::Result> results = loader_->TakeResults();
-  for (const ThumbnailLoader::Result& result : results) cache_.Put(result.wish, result.thumbnail);
+  for (const ThumbnailLoader::Result& result : results) {
+    // A stand-in that comes late is of no use.
+    const bool late = result.wish.standIn && cache_.FindAny(result.wish.path) != nullptr;
+    if (result.thumbnail != nullptr && !late) cache_.Put(result.wish, result.thumbnail);
+  }
   if (listener_ && !results.empty()) listener_(results);
 }
 
