@@ -5,6 +5,7 @@
 
 #include "batch/destination_name.h"
 #include "core/settings.h"
+#include "desktop/previous_file.h"
 #include "platform/file_view.h"
 #include "platform/files.h"
 #include "platform/folders.h"
@@ -24,7 +25,7 @@ using Outcome = std::string;
 
 std::string FolderOf(const std::string& path) { return std::string(platform::SplitPath(path).folder); }
 
-Outcome CopyFile(const std::string& from, const std::string& to) {
+Outcome CopyFile(const std::string& from, const std::string& to, platform::Existing existing) {
   constexpr size_t kPart = 4 * 1024 * 1024;
   platform::FileView view;
   platform::OutputFile output;
@@ -36,7 +37,7 @@ Outcome CopyFile(const std::string& from, const std::string& to) {
       return "The copy could not be written; the disk may be full.";
   }
   if (!view.Intact()) return "It was cut short while it was copied.";
-  const platform::CommitResult result = output.Commit(platform::Existing::Refuse);
+  const platform::CommitResult result = output.Commit(existing);
   if (result == platform::CommitResult::Taken) return kTaken;
   if (result != platform::CommitResult::Done) return "The copy could not be written; the disk may be full.";
   (void)platform::CopyTimes(from, to);
@@ -44,7 +45,7 @@ Outcome CopyFile(const std::string& from, const std::string& to) {
 }
 
 Outcome CopyTree(const std::string& from, const std::string& to, int depth) {
-  if (!platform::IsFolder(from)) return CopyFile(from, to);
+  if (!platform::IsFolder(from)) return CopyFile(from, to, platform::Existing::Refuse);
   if (depth > kDeepest) return "Its folders lie too deep in each other.";
   if (to.starts_with(platform::JoinFolder(from, ""))) return "A folder cannot be copied into itself.";
   if (platform::FileExists(to)) return kTaken;
@@ -107,12 +108,26 @@ Outcome Restore(const std::string& path) {
   return platform::RestoreFromTrash(path) ? Outcome() : Outcome("It is not in the trash any more.");
 }
 
+// The file becomes what it was before, and what it was until now is kept in its place.
+Outcome Exchange(const FileStep& step) {
+  if (!platform::FileExists(step.from)) return kGone;
+  if (step.previous->HasChanged(step.from)) return "It has changed since and stays.";
+  PreviousFile now;
+  if (!now.Keep(step.from)) return "There is no room to keep it as it is now.";
+  Outcome outcome = CopyFile(step.previous->Path(), step.from, platform::Existing::Replace);
+  if (!outcome.empty()) return outcome;
+  step.previous->Swap(now);
+  step.previous->Replaced(step.from);
+  return {};
+}
+
 Outcome DoStep(DeedKind kind, const FileStep& step) {
   switch (kind) {
     case DeedKind::Rename:
     case DeedKind::Move: return MoveOne(step.from, step.to);
     case DeedKind::Copy: return CopyTree(step.from, step.to, 0);
     case DeedKind::Create: return Restore(step.to);
+    case DeedKind::Turn: return Exchange(step);
     case DeedKind::Trash: break;
   }
   return TrashOne(step.from);
@@ -134,6 +149,7 @@ Outcome UndoStep(DeedKind kind, const FileStep& step) {
     case DeedKind::Move: return MoveOne(step.to, step.from);
     case DeedKind::Copy: return RemoveCopy(step);
     case DeedKind::Create: return TrashOne(step.to);
+    case DeedKind::Turn: return Exchange(step);
     case DeedKind::Trash: break;
   }
   return Restore(step.from);
@@ -145,6 +161,7 @@ const char* KindName(DeedKind kind) {
     case DeedKind::Move: return "move";
     case DeedKind::Copy: return "copy";
     case DeedKind::Create: return "output";
+    case DeedKind::Turn: return "rotation";
     case DeedKind::Trash: break;
   }
   return "deletion";
@@ -195,7 +212,7 @@ DeedResult TakeBack(const FileDeed& deed, const DeedProgress& progress) {
     if (outcome.empty()) {
       result.done.steps.insert(result.done.steps.begin(), step);
     } else {
-      result.failures.push_back({deed.kind == DeedKind::Trash ? step.from : step.to, outcome});
+      result.failures.push_back({step.to.empty() ? step.from : step.to, outcome});
     }
   }
   return result;

@@ -2,6 +2,7 @@
 
 #include <cstdint>
 #include <functional>
+#include <memory>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -15,11 +16,15 @@ enum class DeedKind {
   Copy,
   Trash,
   Create,  // a function wrote `to` from `from`, in nobody's place
+  Turn,    // the picture in `from` was rotated or flipped
 };
+
+class PreviousFile;
 
 struct FileStep {
   std::string from;
-  std::string to;  // empty for Trash
+  std::string to;                               // empty for Trash and Turn
+  std::shared_ptr<PreviousFile> previous = {};  // Turn: what the file was before; after TakeBack, what it was before that
 };
 
 // What was done in one go, in order.
@@ -37,6 +42,7 @@ struct DeedFailure {
 struct DeedResult {
   FileDeed done;
   std::vector<DeedFailure> failures;
+  std::string note = {};  // a remark on what was done, as a sentence
 };
 
 // Told before each step; false ends the deed there.

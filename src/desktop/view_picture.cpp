@@ -77,6 +77,29 @@ ViewPicturePointer LoadViewPicture(const ViewWish& wish) {
   return view;
 }
 
+ViewPicturePointer TurnedView(const ViewPicture& view, Orientation turn) {
+  const PictureRecord& old = *view.picture;
+  auto turned = std::make_shared<ViewPicture>();
+  turned->wish = view.wish;
+  turned->photo = view.photo;
+  turned->picture = NewPictureRecord();
+  if (turned->picture == nullptr) return nullptr;
+  PictureRecord& picture = *turned->picture;
+  if (OrientImage(old.image, turn, picture.image) != Status::Ok) return nullptr;
+  if (!old.alpha.Empty() && OrientImage(old.alpha, turn, picture.alpha) != Status::Ok) return nullptr;
+  picture.width = picture.image.Width();
+  picture.height = picture.image.Height();
+  picture.bitsPerPixel = old.bitsPerPixel;
+  picture.palette = old.palette;
+  picture.alphaFlags = old.alphaFlags;
+  picture.fileName = old.fileName;
+  picture.fileSize = old.fileSize;
+  picture.formatIndex = old.formatIndex;
+  picture.pageCount = old.pageCount;
+  picture.page = old.page;
+  return turned;
+}
+
 ViewLoader::ViewLoader(uint64_t capacity, std::function<void()> wake)
     : capacity_(capacity), wake_(std::move(wake)), worker_([this] { Work(); }) {}
 

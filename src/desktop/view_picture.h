@@ -10,6 +10,7 @@
 
 #include "core/status.h"
 #include "picture/picture_record.h"
+#include "processing/orient.h"
 
 namespace fotomill::desktop {
 
@@ -54,6 +55,8 @@ using ViewPicturePointer = std::shared_ptr<const ViewPicture>;
 std::string SizeAndZoom(const PictureRecord& picture, double scale);
 
 ViewPicturePointer LoadViewPicture(const ViewWish& wish);
+// A turned copy of a picture that was loaded; null where there is no memory for it.
+ViewPicturePointer TurnedView(const ViewPicture& view, Orientation turn);
 
 // Decodes pictures ahead on a thread of its own, and keeps those that are wanted up to a number of bytes.
 class ViewLoader {

@@ -4,6 +4,7 @@
 #include <span>
 #include <string>
 #include <string_view>
+#include <utility>
 
 namespace fotomill::platform {
 
@@ -22,6 +23,14 @@ class TemporaryFile {
   [[nodiscard]] bool Create(std::string_view extension = {});
   // Makes `bytes` the whole contents. False when not all could be written.
   [[nodiscard]] bool Write(std::span<const uint8_t> bytes);
+  // Becomes a file of `folder`, which is made when it is missing, with what the regular file `path` holds now: that file itself
+  // under a second name where the file system can, else a copy of it with its time. Who replaces `path` by a new file leaves this
+  // one as it is. False when that is not possible; a file that was held before is gone then too.
+  [[nodiscard]] bool Keep(const std::string& path, const std::string& folder);
+  void Swap(TemporaryFile& other) {
+    std::swap(path_, other.path_);
+    std::swap(listed_, other.listed_);
+  }
   const std::string& Path() const { return path_; }
   void Delete();
 

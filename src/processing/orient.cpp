@@ -51,7 +51,10 @@ void TurnRows(const PackedImage& from, PackedImage& to, Turn turn) {
   }
 }
 
-Status TurnImage(const PackedImage& image, Turn turn, PackedImage& turned) {
+}  // namespace
+
+Status OrientImage(const PackedImage& image, Orientation orientation, PackedImage& turned) {
+  const Turn turn = TurnOf(orientation);
   const int32_t width = turn.swap ? image.Height() : image.Width();
   const int32_t height = turn.swap ? image.Width() : image.Height();
   PackedImage made;
@@ -74,14 +77,12 @@ Status TurnImage(const PackedImage& image, Turn turn, PackedImage& turned) {
   return Status::Ok;
 }
 
-}  // namespace
-
 Status OrientPicture(PictureRecord& picture, Orientation orientation) {
   const Turn turn = TurnOf(orientation);
   if (turn == Turn{} || picture.image.Empty()) return Status::Ok;
   PackedImage image, alpha;
-  RETURN_IF_BAD(TurnImage(picture.image, turn, image));
-  if (!picture.alpha.Empty()) RETURN_IF_BAD(TurnImage(picture.alpha, turn, alpha));
+  RETURN_IF_BAD(OrientImage(picture.image, orientation, image));
+  if (!picture.alpha.Empty()) RETURN_IF_BAD(OrientImage(picture.alpha, orientation, alpha));
   picture.image = std::move(image);
   picture.alpha = std::move(alpha);
   if (turn.swap) {

@@ -47,6 +47,9 @@ constexpr Orientation Composed(Orientation first, Orientation then) {
 // Whether an orientation exchanges width and height.
 constexpr bool SwapsSides(Orientation orientation) { return TurnOf(orientation).swap; }
 
+// A turned copy of an image of any depth. MemoryAllocationError leaves `turned` unchanged.
+Status OrientImage(const PackedImage& image, Orientation orientation, PackedImage& turned);
+
 // Turns image and alpha plane, of any depth, into the upright position; where sides change places, `width` and `height`
 // and the two resolutions do as well. The orientation tag of the record's EXIF block is the caller's to change. Numbers
 // outside 1 to 8 leave the picture as it is. MemoryAllocationError leaves it unchanged.

@@ -111,4 +111,57 @@ def thumbnails_and_session(folder):
         desktop.wait(r"browser tabs=2 lines=2 .*listing=0 view=4 .*focus=b.bmp folder=.*pictures$")
 
 
-run(rename_delete_undo_paste, rename_in_sequence, thumbnails_and_session)
+def turn_and_take_back(folder):
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["a.bmp", "b.jpg"])
+    paths = [pictures / "a.bmp", pictures / "b.jpg"]
+    before = [path.read_bytes() for path in paths]
+    def changed():
+        return [path.read_bytes() != old for path, old in zip(paths, before)]
+
+    with Desktop(folder, pictures, settings=["UpdateThumbnailsFlag=0"]) as desktop:
+        desktop.wait(r"lines=2 .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("Home", "Return")
+        desktop.wait(r"view place=1/2 .*status=0 .*a.bmp")
+        desktop.focus("View$")
+        # A turn belongs to the view until it is saved.
+        desktop.key("r", "space")
+        desktop.wait(r"view-turned 6 .*a.bmp")
+        desktop.wait(r"view place=2/2 .*b.jpg")
+        desktop.key("BackSpace", "l")
+        desktop.wait(r"view-turned 8 .*a.bmp")
+        desktop.screenshot("view-turned")
+        assert changed() == [False, False], changed()
+        desktop.key("ctrl+s")
+        desktop.wait(r"files Rotation of a.bmp done=1 failed=0")
+        desktop.wait(r"view place=1/2 .*status=0 .*a.bmp")
+        old, new = before[0], paths[0].read_bytes()
+        assert (old[18:22], old[22:26]) == (new[22:26], new[18:22]), "sides did not change places"
+        desktop.key("ctrl+z")
+        desktop.wait(r"files Undo rotation of a.bmp done=1 failed=0")
+        desktop.wait(r"view place=1/2 .*status=0 .*a.bmp")
+        assert changed() == [False, False], changed()
+        desktop.key("Escape")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+a", "ctrl+alt+r")
+        desktop.wait(r"batch ended status=0")
+        desktop.wait(r"lines=2 .*missing=0 listing=0")
+        assert changed() == [True, True], changed()
+        desktop.screenshot("browser-turned")
+        desktop.key("ctrl+z")
+        desktop.wait(r"files Undo rotation of 2 files done=2 failed=0")
+        assert changed() == [False, False], changed()
+        desktop.key("ctrl+y")
+        desktop.wait(r"files Redo rotation of 2 files done=2 failed=0")
+        assert changed() == [True, True], changed()
+        # Undone once more, a file that somebody has worked on since stays.
+        paths[1].write_bytes(paths[1].read_bytes() + b"more")
+        desktop.key("ctrl+z")
+        desktop.wait(r"files Undo rotation of 2 files done=1 failed=1")
+        assert changed() == [False, True], changed()
+        desktop.focus("Not everything")
+        desktop.key("Return")
+
+
+run(rename_delete_undo_paste, rename_in_sequence, thumbnails_and_session, turn_and_take_back)

@@ -4,9 +4,12 @@
 #include <wx/textdlg.h>
 
 #include "batch/abort.h"
+#include "batch/turn_run.h"
 #include "core/configuration.h"
+#include "core/settings.h"
 #include "desktop/destination_choice.h"
 #include "desktop/event_log.h"
+#include "desktop/previous_file.h"
 #include "desktop/windows/destination_dialog.h"
 #include "desktop/windows/file_actions.h"
 #include "desktop/windows/main_frame.h"
@@ -32,8 +35,8 @@ void BatchRunner::Run(std::vector<BatchFile> files, BatchFunction function, Batc
   });
 }
 
-void BatchRunner::Run(BatchJob job, BatchThread::Work work) {
-  waiting_.push_back({std::move(job), std::move(work)});
+void BatchRunner::Run(BatchJob job, BatchThread::Work work, std::shared_ptr<PreviousFiles> previous) {
+  waiting_.push_back({std::move(job), std::move(work), std::move(previous)});
   if (!Running()) {
     StartNext();
   } else {
@@ -47,6 +50,7 @@ void BatchRunner::StartNext() {
   written_ = {DeedKind::Create, {}};
   Waiting next = std::move(waiting_.front());
   waiting_.pop_front();
+  previous_ = std::move(next.previous);
   thread_->StartWork(std::move(next.job), std::move(next.work));
 }
 
@@ -99,6 +103,7 @@ void BatchRunner::BatchEnded(Status status, const BatchJob& job) {
   frame_.NoteUses(job.uses);
   // Outputs, not files that were given other names.
   if (job.formatIndex != kNoFormat) frame_.Files().NoteDone(std::exchange(written_, {}));
+  if (previous_ != nullptr) frame_.Files().NoteDone(std::exchange(previous_, nullptr)->Deed());
   if (job.filesChanged) frame_.FilesChanged();
   if (!frame_.IsActive() && (box_ == nullptr || !box_->IsActive())) frame_.RequestUserAttention(wxUSER_ATTENTION_INFO);
   if (status == Status::Ok) frame_.Tell(CountLine(job.progress.Files()));
@@ -147,6 +152,17 @@ void BatchRunner::StoreFlag(KeyNumber key, bool value) {
   SettingValue flag;
   flag.number = value ? 1 : 0;
   if (StoreSetting(KeyOf(key), flag) != SaveResult::Done) StoreNumber(KeyOf(key), flag.number);
+}
+
+void TurnSelection(MainFrame& frame, Orientation turn) {
+  std::vector<BatchFile> files;
+  for (const std::string& file : frame.SelectedFiles()) files.push_back({.name = file, .below = {}, .hint = {}});
+  if (files.empty()) return;
+  auto previous = std::make_shared<PreviousFiles>();
+  TurnFunction function{.request = {.turn = turn, .seenByExif = settings.ExifAdjustOrientation != 0}, .inPlace = true};
+  function.keepPrevious = [previous](const std::string& path) { return previous->Keep(path); };
+  frame.Batches().Run(
+      BatchJob(), [files, function](BatchJob& job) { return RunTurn(files, function, job); }, previous);
 }
 
 void ConvertSelection(MainFrame& frame) {

@@ -9,10 +9,12 @@
 
 #include "desktop/batch_thread.h"
 #include "desktop/file_deeds.h"
+#include "processing/orient.h"
 
 namespace fotomill::desktop {
 
 class MainFrame;
+class PreviousFiles;
 class ProgressWindow;
 
 // Runs batches for a frame, one after the other, with their progress box and prompts.
@@ -23,13 +25,15 @@ class BatchRunner : public wxEvtHandler, public BatchWindows {
 
   // Begins a batch, or has it wait for those before.
   void Run(std::vector<BatchFile> files, BatchFunction function, BatchJob job);
-  void Run(BatchJob job, BatchThread::Work work);
+  // With the files that the batch will replace, where it keeps them.
+  void Run(BatchJob job, BatchThread::Work work, std::shared_ptr<PreviousFiles> previous = nullptr);
   bool Running() const { return thread_->Running(); }
 
  private:
   struct Waiting {
     BatchJob job;
     BatchThread::Work work;
+    std::shared_ptr<PreviousFiles> previous;
   };
   void StartNext();
   void CloseBox();
@@ -52,9 +56,13 @@ class BatchRunner : public wxEvtHandler, public BatchWindows {
   MainFrame& frame_;
   std::deque<Waiting> waiting_;
   ProgressWindow* box_ = nullptr;
-  FileDeed written_;  // by the batch that runs, as far as it can be taken back
+  std::shared_ptr<PreviousFiles> previous_;  // of the batch that runs
+  FileDeed written_;                         // by the batch that runs, as far as it can be taken back
   std::unique_ptr<BatchThread> thread_;
 };
+
+// Turns the frame's selection in its files.
+void TurnSelection(MainFrame& frame, Orientation turn);
 
 // The function Convert: asks for the destination and runs the batch over the frame's selection.
 void ConvertSelection(MainFrame& frame);

@@ -71,6 +71,10 @@ void CopyPaths(MainFrame& frame) { frame.Files().PathsToClipboard(frame.Selected
 void Paste(MainFrame& frame) { frame.Files().Paste(frame.CurrentFolder()); }
 void NewFolder(MainFrame& frame) { frame.Files().NewFolder(frame.CurrentFolder()); }
 
+template <Orientation turn>
+void Turn(MainFrame& frame) {
+  TurnSelection(frame, turn);
+}
 void NewTab(MainFrame& frame) { frame.OpenTab(frame.CurrentFolder()); }
 void CloseTab(MainFrame& frame) { frame.CloseTab(); }
 void ReopenTab(MainFrame& frame) { frame.ReopenTab(); }
@@ -162,6 +166,8 @@ constexpr Command kCommands[] = {
     {kFunctions, "&View",          "Ctrl+Return",  "Shows the focused picture in a view window.", Needs::Files, View, "view", true},
     {kFunctions, "Com&pare",       "Ctrl+Shift+Return", "Shows two to four selected pictures beside each other.", Needs::Few, CompareSelection, nullptr, true},
     {kFunctions, "&Convert...",    "Ctrl+E",       "Writes the selected pictures in another format.", Needs::Files, ConvertSelection, "convert", true},
+    {kFunctions, "Rotate &left",   "Ctrl+Alt+L",   "Rotates the selected pictures in their files; JPEG loses nothing.", Needs::Files, Turn<Orientation::QuarterLeft>, nullptr, true},
+    {kFunctions, "Rotate r&ight",  "Ctrl+Alt+R",   "Rotates the selected pictures in their files; JPEG loses nothing.", Needs::Files, Turn<Orientation::QuarterRight>, nullptr, true},
     {kFunctions, "&Get info...",   "Alt+Return",   "Tells what the selected files hold.", Needs::Files, ShowInfo, "info", true},
     {kFunctions, "E&XIF...",       "Alt+Shift+Return", "Shows what the camera wrote into the focused picture.", Needs::Files, ShowExif, "exif", true},
     {kFunctions, nullptr},

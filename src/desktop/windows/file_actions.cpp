@@ -15,6 +15,7 @@
 #include "core/settings.h"
 #include "desktop/event_log.h"
 #include "desktop/pasted_picture.h"
+#include "desktop/previous_file.h"
 #include "desktop/windows/folder_dialog.h"
 #include "desktop/windows/main_frame.h"
 #include "desktop/windows/wx_text.h"
@@ -69,7 +70,8 @@ void FileActions::Run(const std::string& what, Work work, Then then) {
 
 void FileActions::Finished(const std::string& what, DeedResult result, const Then& then) {
   busy_ = false;
-  frame_.Tell(what + (result.failures.empty() ? "" : ", " + std::to_string(result.failures.size()) + " failed"));
+  const std::string failed = result.failures.empty() ? "" : ", " + std::to_string(result.failures.size()) + " failed";
+  frame_.Tell(what + failed + (result.note.empty() ? "" : ": " + result.note));
   LogEvent("files",
            what + " done=" + std::to_string(result.done.steps.size()) + " failed=" + std::to_string(result.failures.size()));
   const std::vector<DeedFailure> failures = result.failures;
@@ -182,6 +184,17 @@ void FileActions::NewFolder(const std::string& parent) {
   if (BrowserPage* browser = frame_.Browser(); browser != nullptr && browser->Model().Folder() == parent)
     browser->Open(parent, name);
   frame_.FilesChanged();
+}
+
+bool FileActions::SaveTurned(const std::string& path, Orientation turn, std::function<void(bool done)> then) {
+  if (busy_) return false;
+  const auto work = [path, turn](const DeedProgress&) { return TurnOneFile(path, turn); };
+  Run("Rotation of " + std::string(platform::FileNameOf(path)), work, [this, then = std::move(then)](DeedResult result) {
+    const bool done = !result.done.steps.empty();
+    undo_.Add(std::move(result.done));
+    then(done);
+  });
+  return true;
 }
 
 // --- undo ---

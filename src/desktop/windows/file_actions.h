@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "desktop/file_deeds.h"
+#include "processing/orient.h"
 
 namespace fotomill::desktop {
 
@@ -33,6 +34,8 @@ class FileActions : public wxEvtHandler {
   // Several files at once, as the caller has planned it.
   void RenameAll(std::vector<FileStep> steps);
   void NewFolder(const std::string& parent);
+  // Turns the picture in a file; `then` is told whether that was done. False when something else is being done.
+  bool SaveTurned(const std::string& path, Orientation turn, std::function<void(bool done)> then);
 
   void Undo();
   void Redo();

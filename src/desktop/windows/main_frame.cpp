@@ -386,6 +386,9 @@ void MainFrame::FilesChanged() {
   tree_->UpdatePlaces();
   tree_->Reread();
   for (size_t tab = 0; tab < tabs_->GetPageCount(); ++tab) PageAt(tab)->Reload();
+  for (wxWindow* window : GetChildren()) {
+    if (auto* view = dynamic_cast<ViewFrame*>(window)) view->FilesChanged();
+  }
 }
 
 void MainFrame::NoteUses(const std::vector<FileUse>& uses) {

@@ -20,6 +20,10 @@ template <ZoomMode mode>
 void Zoom(ViewFrame& view) {
   view.Canvas().SetZoom(mode);
 }
+template <Orientation turn>
+void Turn(ViewFrame& view) {
+  view.Turn(turn);
+}
 template <void (ViewFrame::*action)()>
 void Of(ViewFrame& view) {
   (view.*action)();
@@ -59,6 +63,14 @@ constexpr KeyCommand<ViewFrame> kCommands[] = {
     {"Colors of the pro&file", "M",    {'M'},                           Switch<&Settings::ViewModeColorProfiles>, IsOn<&Settings::ViewModeColorProfiles>},
     {"Check&erboard behind transparency", "B", {'B'},                   Switch<&Settings::ViewModeCheckerboard>, IsOn<&Settings::ViewModeCheckerboard>},
     {"G&et info...",      "Alt+Enter", {},                              Of<&ViewFrame::ShowInfoWindow>},
+    {nullptr, nullptr, {}, nullptr},
+    {"Rotate &left",      "L",         {'L'},                           Turn<Orientation::QuarterLeft>},
+    {"Rotate &right",     "R",         {'R'},                           Turn<Orientation::QuarterRight>},
+    {"Flip left and right", "H",       {'H'},                           Turn<Orientation::MirrorAcross>},
+    {"Flip top and bottom", "V",       {'V'},                           Turn<Orientation::MirrorDown>},
+    {"Sa&ve the turned picture", "Ctrl+S", {WXK_CONTROL_S},             Of<&ViewFrame::SaveTurned>},
+    {"&Undo",             "Ctrl+Z",    {WXK_CONTROL_Z},                 Of<&ViewFrame::Undo>},
+    {"Redo",              "Ctrl+Y",    {WXK_CONTROL_Y},                 Of<&ViewFrame::Redo>},
     {nullptr, nullptr, {}, nullptr},
     {"&Delete",           "Del",       {WXK_DELETE},                    Of<&ViewFrame::DeleteFile>},
     {"&Copy picture",     "Ctrl+C",    {WXK_CONTROL_C},                 Of<&ViewFrame::CopyPicture>},

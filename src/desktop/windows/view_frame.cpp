@@ -1,6 +1,7 @@
 #include "desktop/windows/view_frame.h"
 
 #include <wx/clipbrd.h>
+#include <wx/weakref.h>
 
 #include <algorithm>
 #include <cmath>
@@ -84,9 +85,7 @@ void ViewFrame::Step(int files) {
 void ViewFrame::GoTo(size_t place) {
   if (place >= list_.size() || (place == place_ && page_ == 0 && canvas_->Picture() != nullptr)) return;
   place_ = place;
-  page_ = 0;
-  canvas_->StartAfresh();
-  ShowPlace();
+  StartAfresh();
 }
 
 void ViewFrame::StepPage(int pages) {
@@ -95,6 +94,14 @@ void ViewFrame::StepPage(int pages) {
   const int32_t page = page_ + pages;
   if (page < 0 || page >= shown->picture->pageCount) return;
   page_ = page;
+  turn_ = Orientation::Upright;
+  ShowPlace();
+}
+
+void ViewFrame::StartAfresh() {
+  page_ = 0;
+  turn_ = Orientation::Upright;
+  canvas_->StartAfresh();
   ShowPlace();
 }
 
@@ -141,7 +148,7 @@ void ViewFrame::WantPictures() {
 }
 
 void ViewFrame::PictureCame() {
-  if (IsCurrent(canvas_->Picture())) return;
+  if (IsCurrent(loaded_)) return;
   if (const ViewPicturePointer ready = loader_->Find(WishOf(place_))) TakePicture(ready);
 }
 
@@ -151,8 +158,17 @@ void ViewFrame::TakePicture(ViewPicturePointer picture) {
                        " ms=" + std::to_string(std::lround((platform::MonotonicSeconds() - keyTime_) * 1000)) +
                        " file=" + list_[place_]);
   if (picture->picture != nullptr) frame_.NoteUses({FileUse{list_[place_], FileFunction::View}});
-  canvas_->Show(std::move(picture));
+  loaded_ = std::move(picture);
+  loadedFacts_ = platform::FactsOf(list_[place_]);
+  ShowTurned();
   if (slideTimer_.IsRunning()) slideTimer_.Start(kSlideMs);
+}
+
+void ViewFrame::ShowTurned() {
+  const bool turns = turn_ != Orientation::Upright && loaded_->picture != nullptr;
+  ViewPicturePointer turned = turns ? TurnedView(*loaded_, turn_) : loaded_;
+  if (turned == nullptr) return wxBell();
+  canvas_->Show(std::move(turned));
 }
 
 bool ViewFrame::IsCurrent(const ViewPicturePointer& picture) const {
@@ -192,7 +208,7 @@ void ViewFrame::ViewChanged() {
   if (canvas_ == nullptr || GetStatusBar() == nullptr) return;  // still being made
   const std::string line = StatusLine();
   const wxString name = Shown(platform::FileNameOf(list_[place_]));
-  SetTitle(name + " - View");
+  SetTitle(name + (turn_ == Orientation::Upright ? "" : " (turned, not saved)") + " - View");
   SetStatusText(Shown(line));
   TellScreenReader(*canvas_, name, Shown(line));
   canvas_->SetOverlay(overlay_ ? OverlayLines() : std::vector<std::string>());
@@ -246,10 +262,48 @@ void ViewFrame::DeleteFile() {
     return;
   }
   place_ = std::min(place_, list_.size() - 1);
-  page_ = 0;
-  canvas_->StartAfresh();
-  ShowPlace();
+  StartAfresh();
 }
+
+// --- turning ---
+
+void ViewFrame::Turn(Orientation turn) {
+  if (saving_ || !IsCurrent(loaded_) || loaded_->picture == nullptr) return wxBell();
+  turn_ = Composed(turn_, turn);
+  LogEvent("view-turned", std::to_string(static_cast<int>(turn_)) + " " + list_[place_]);
+  ShowTurned();
+}
+
+void ViewFrame::SaveTurned() {
+  if (saving_ || turn_ == Orientation::Upright) return SetStatusText("The picture is as its file has it.");
+  const std::string path = list_[place_];
+  const wxWeakRef<ViewFrame> self(this);
+  saving_ = frame_.Files().SaveTurned(path, turn_, [self](bool done) {
+    if (!self) return;
+    self->saving_ = false;
+    if (done) self->FilesChanged();
+  });
+  SetStatusText(saving_ ? "Saving..." : "Wait until the files before are done.");
+}
+
+void ViewFrame::FilesChanged() {
+  const platform::FileFacts facts = platform::FactsOf(list_[place_]);
+  const bool same =
+      facts.identity == loadedFacts_.identity && facts.size == loadedFacts_.size && facts.modified == loadedFacts_.modified;
+  if (loaded_ == nullptr || saving_ || same || facts.kind != platform::FileKind::Regular) return;
+  loader_->Forget(list_[place_]);
+  loaded_.reset();
+  StartAfresh();
+}
+
+void ViewFrame::Undo() {
+  if (saving_) return wxBell();
+  if (turn_ == Orientation::Upright || loaded_ == nullptr) return frame_.Files().Undo();
+  turn_ = Orientation::Upright;
+  ShowTurned();
+}
+
+void ViewFrame::Redo() { frame_.Files().Redo(); }
 
 void ViewFrame::CopyPicture() {
   const ViewPicturePointer& shown = canvas_->Picture();
@@ -272,7 +326,8 @@ void ViewFrame::OnKey(wxKeyEvent& event) {
   if (key == WXK_RIGHT || key == WXK_DOWN) return Step(1);
   if (event.AltDown() && key == WXK_RETURN) return ShowInfoWindow();
   if (event.AltDown()) return event.Skip();
-  const int typed = event.ControlDown() ? (key == 'C' ? static_cast<int>(WXK_CONTROL_C) : 0) : key;
+  const bool letter = key >= 'A' && key <= 'Z';
+  const int typed = !event.ControlDown() ? key : letter ? key - 'A' + WXK_CONTROL_A : 0;
   if (const KeyCommand<ViewFrame>* command = CommandOfKey(ViewCommands(), typed)) return command->run(*this);
   event.Skip();
 }

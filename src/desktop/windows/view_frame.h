@@ -9,6 +9,7 @@
 
 #include "desktop/view_picture.h"
 #include "desktop/windows/view_canvas.h"
+#include "platform/files.h"
 
 namespace fotomill::desktop {
 
@@ -32,6 +33,12 @@ class ViewFrame : public wxFrame {
   void CopyPicture();
   void DeleteFile();  // to the trash; the next one is shown
   void ShowInfoWindow();
+  void Turn(Orientation turn);  // the view; nothing is written
+  void SaveTurned();            // the file, as it is seen
+  void Undo();                  // the view's turn, else what was done to files
+  void Redo();
+  // Files were written: a picture whose file is another one now is loaded again.
+  void FilesChanged();
   size_t LastPlace() const { return list_.size() - 1; }
   ViewCanvas& Canvas() { return *canvas_; }
 
@@ -51,11 +58,17 @@ class ViewFrame : public wxFrame {
   void OnKey(wxKeyEvent& event);
   void ShowMenu(const wxPoint& place);
   void LogPaint();
+  void StartAfresh();
+  void ShowTurned();
 
   MainFrame& frame_;
   std::vector<std::string> list_;
   size_t place_ = 0;
   int32_t page_ = 0;
+  Orientation turn_ = Orientation::Upright;  // how the view is turned against the file
+  ViewPicturePointer loaded_;                // as the file has it
+  platform::FileFacts loadedFacts_;          // of its file
+  bool saving_ = false;
   double keyTime_ = 0;  // when the picture that is awaited was asked for
   bool overlay_ = false;
   std::string painted_;  // what the log was told of

@@ -8,6 +8,8 @@
 #include <cstdio>
 
 #include "platform/fault.h"
+#include "platform/file_view.h"
+#include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
 #include "platform/posix/handle.h"
@@ -60,6 +62,27 @@ bool TemporaryFile::Create(std::string_view extension) {
   }
   listed_ = EnterTemporaryName(path_);
   return true;
+}
+
+bool TemporaryFile::Keep(const std::string& path, const std::string& folder) {
+  Delete();
+  if (!IsRegularFile(path) || !MakeFolders(folder)) return false;
+  for (int attempt = 0; attempt < kAttempts; ++attempt) {
+    std::string name = JoinFolder(folder, RandomName(".old"));
+    if (FaultDue()) return false;
+    if (linkat(AT_FDCWD, path.c_str(), AT_FDCWD, name.c_str(), AT_SYMLINK_FOLLOW) != 0) {
+      if (errno == EEXIST) continue;
+      if (!CreateExclusively(name)) return false;
+    }
+    path_ = std::move(name);
+    listed_ = EnterTemporaryName(path_);
+    break;
+  }
+  FileView view;
+  if (path_.empty() || FactsOf(path_).identity == FactsOf(path).identity) return !path_.empty();
+  if (view.Open(path) && Write(view.Bytes()) && view.Intact() && CopyTimes(path, path_)) return true;
+  Delete();
+  return false;
 }
 
 bool TemporaryFile::Write(std::span<const uint8_t> bytes) {

@@ -1,0 +1,62 @@
+#include "desktop/previous_file.h"
+
+#include <utility>
+
+#include "batch/turn_file.h"
+#include "core/data_folder.h"
+#include "core/settings.h"
+#include "platform/folders.h"
+#include "platform/paths.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+std::string KeptFolder() { return platform::JoinFolder(DataFolder(), "undo"); }
+
+bool SameFile(const platform::FileFacts& a, const platform::FileFacts& b) {
+  return a.identity == b.identity && a.device == b.device && a.size == b.size && a.modified == b.modified;
+}
+
+}  // namespace
+
+bool PreviousFile::Keep(const std::string& path) { return kept_.Keep(path, KeptFolder()); }
+
+bool PreviousFile::HasChanged(const std::string& path) const { return !SameFile(platform::FactsOf(path), replaced_); }
+
+bool PreviousFiles::Keep(const std::string& path) {
+  auto file = std::make_shared<PreviousFile>();
+  if (!file->Keep(path)) return false;
+  file->Replaced(path);
+  const std::lock_guard lock(mutex_);
+  return files_.emplace(platform::AbsolutePath(path), std::move(file)).second;
+}
+
+FileDeed PreviousFiles::Deed() {
+  const std::lock_guard lock(mutex_);
+  FileDeed deed{DeedKind::Turn, {}};
+  for (auto& [path, file] : files_) {
+    if (!file->HasChanged(path)) continue;  // it was not replaced after all
+    file->Replaced(path);
+    deed.steps.push_back({path, {}, std::move(file)});
+  }
+  files_.clear();
+  return deed;
+}
+
+DeedResult TurnOneFile(const std::string& path, Orientation turn) {
+  PreviousFiles previous;
+  WriteOptions options;
+  bool kept = true;
+  options.makeWay = [&] { return kept = previous.Keep(path); };
+  const TurnRequest request{.turn = turn, .seenByExif = settings.ExifAdjustOrientation != 0};
+  const TurnedFile turned = TurnPictureFile(path, path, request, options);
+  DeedResult result{previous.Deed(), {}, turned.note};
+  if (turned.status != Status::Ok) {
+    const std::string hint = kept ? turned.hint : std::string("There is no room to keep the old file for undo.");
+    result.failures.push_back({path, std::string(StatusMessage(turned.status)) + (hint.empty() ? "" : " ") + hint});
+  }
+  return result;
+}
+
+}  // namespace fotomill::desktop
