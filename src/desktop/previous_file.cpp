@@ -5,6 +5,8 @@
 #include "batch/turn_file.h"
 #include "core/data_folder.h"
 #include "core/settings.h"
+#include "core/whole_number.h"
+#include "platform/clock.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
 
@@ -12,7 +14,15 @@ namespace fotomill::desktop {
 
 namespace {
 
-std::string KeptFolder() { return platform::JoinFolder(DataFolder(), "undo"); }
+// A folder a day, by its number, so that what a killed program left there can be told from what one that runs needs.
+constexpr int64_t kSecondsOfDay = 86400, kDaysKept = 30;
+int64_t Today() { return platform::Now() / kSecondsOfDay; }
+std::string UndoFolder() { return platform::JoinFolder(DataFolder(), "undo"); }
+std::string KeptFolder() { return platform::JoinFolder(UndoFolder(), std::to_string(Today())); }
+
+std::vector<platform::FolderEntry> EntriesOf(const std::string& folder) {
+  return platform::ListFolder(folder).value_or(std::vector<platform::FolderEntry>());
+}
 
 bool SameFile(const platform::FileFacts& a, const platform::FileFacts& b) {
   return a.identity == b.identity && a.device == b.device && a.size == b.size && a.modified == b.modified;
@@ -42,6 +52,18 @@ FileDeed PreviousFiles::Deed() {
   }
   files_.clear();
   return deed;
+}
+
+void DeleteOldPreviousFiles() {
+  for (const platform::FolderEntry& day : EntriesOf(UndoFolder())) {
+    const auto number = ParseNumber<int64_t>(day.name);
+    if (day.kind != platform::FileKind::Folder || day.link || !number || *number == Today()) continue;
+    const std::string folder = platform::JoinFolder(UndoFolder(), day.name);
+    for (const platform::FolderEntry& file : EntriesOf(folder)) {
+      if (*number + kDaysKept < Today()) (void)platform::DeleteFile(platform::JoinFolder(folder, file.name));
+    }
+    (void)platform::DeleteFolder(folder);  // unless there is still something in it
+  }
 }
 
 DeedResult TurnOneFile(const std::string& path, Orientation turn) {

@@ -42,6 +42,9 @@ class PreviousFiles {
   std::map<std::string, std::shared_ptr<PreviousFile>> files_;
 };
 
+// Deletes what a program that was killed a month ago or longer left in the data folder.
+void DeleteOldPreviousFiles();
+
 // Turns the picture in a file and keeps what the file was. Neither step nor failure where it stands so already.
 DeedResult TurnOneFile(const std::string& path, Orientation turn);
 

@@ -68,10 +68,16 @@ std::string SizeAndZoom(const PictureRecord& picture, double scale) {
          SizeText(picture.fileSize, choice::kSizeFitting) + ", " + std::to_string(std::lround(scale * 100)) + "%";
 }
 
+bool ViewPicture::HasChanged() const {
+  const platform::FileFacts now = platform::FactsOf(wish.path);
+  return now.identity != facts.identity || now.device != facts.device || now.size != facts.size || now.modified != facts.modified;
+}
+
 ViewPicturePointer LoadViewPicture(const ViewWish& wish) {
   const double start = platform::MonotonicSeconds();
   auto view = std::make_shared<ViewPicture>();
   view->wish = wish;
+  view->facts = platform::FactsOf(wish.path);
   view->status = LoadInto(wish, *view);
   view->seconds = platform::MonotonicSeconds() - start;
   return view;
@@ -81,6 +87,7 @@ ViewPicturePointer TurnedView(const ViewPicture& view, Orientation turn) {
   const PictureRecord& old = *view.picture;
   auto turned = std::make_shared<ViewPicture>();
   turned->wish = view.wish;
+  turned->facts = view.facts;
   turned->photo = view.photo;
   turned->picture = NewPictureRecord();
   if (turned->picture == nullptr) return nullptr;

@@ -10,6 +10,7 @@
 
 #include "core/status.h"
 #include "picture/picture_record.h"
+#include "platform/files.h"
 #include "processing/orient.h"
 
 namespace fotomill::desktop {
@@ -41,6 +42,7 @@ struct ViewPixels {
 // A decoded picture: upright, 24 bits, with an alpha plane only if its look wants it and not all of it is opaque.
 struct ViewPicture {
   ViewWish wish;
+  platform::FileFacts facts;  // of the file, as it was read
   Status status = Status::Ok;
   PicturePointer picture;          // null unless Ok
   ViewPixels fitted;               // as large as the fit of the wish's window; empty where that is the picture's own size or more
@@ -48,6 +50,8 @@ struct ViewPicture {
   double seconds = 0;              // that decoding took
 
   uint64_t Bytes() const;
+  // Whether the file has become another one since.
+  bool HasChanged() const;
 };
 using ViewPicturePointer = std::shared_ptr<const ViewPicture>;
 

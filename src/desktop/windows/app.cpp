@@ -5,6 +5,7 @@
 #include "core/configuration.h"
 #include "core/data_folder.h"
 #include "desktop/event_log.h"
+#include "desktop/previous_file.h"
 #include "desktop/windows/control_names.h"
 #include "desktop/windows/main_frame.h"
 #include "desktop/windows/override_box.h"
@@ -61,6 +62,7 @@ class App : public wxApp {
     InstallOverrideBoxes();
     RunFormatStartup();
     EnablePlugins();
+    DeleteOldPreviousFiles();
     const Start start = StartFrom(argument_);
     auto* frame = new MainFrame;
     const bool restored = frame->RestoreSession();

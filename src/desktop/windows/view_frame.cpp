@@ -20,6 +20,7 @@
 #include "desktop/windows/view_commands.h"
 #include "desktop/windows/wx_text.h"
 #include "platform/clock.h"
+#include "platform/files.h"
 #include "platform/paths.h"
 
 namespace fotomill::desktop {
@@ -115,7 +116,12 @@ void ViewFrame::ShowPlace() {
 bool ViewFrame::AskForPicture() {
   keyTime_ = platform::MonotonicSeconds();
   WantPictures();
-  const ViewPicturePointer ready = loader_->Find(WishOf(place_));
+  ViewPicturePointer ready = loader_->Find(WishOf(place_));
+  if (ready != nullptr && ready->HasChanged()) {
+    loader_->Forget(list_[place_]);
+    WantPictures();
+    ready = nullptr;
+  }
   if (ready != nullptr) TakePicture(ready);
   return ready != nullptr;
 }
@@ -159,7 +165,6 @@ void ViewFrame::TakePicture(ViewPicturePointer picture) {
                        " file=" + list_[place_]);
   if (picture->picture != nullptr) frame_.NoteUses({FileUse{list_[place_], FileFunction::View}});
   loaded_ = std::move(picture);
-  loadedFacts_ = platform::FactsOf(list_[place_]);
   ShowTurned();
   if (slideTimer_.IsRunning()) slideTimer_.Start(kSlideMs);
 }
@@ -192,6 +197,7 @@ std::string ViewFrame::StatusLine() const {
   if (shown->picture == nullptr) return line + ", " + std::string(StatusMessage(shown->status));
   const PictureRecord& picture = *shown->picture;
   line += ", " + SizeAndZoom(picture, canvas_->Zoom());
+  if (turn_ != Orientation::Upright) line += ", turned, not saved";
   if (picture.pageCount > 1) line += ", page " + std::to_string(page_ + 1) + " of " + std::to_string(picture.pageCount);
   return line;
 }
@@ -287,10 +293,7 @@ void ViewFrame::SaveTurned() {
 }
 
 void ViewFrame::FilesChanged() {
-  const platform::FileFacts facts = platform::FactsOf(list_[place_]);
-  const bool same =
-      facts.identity == loadedFacts_.identity && facts.size == loadedFacts_.size && facts.modified == loadedFacts_.modified;
-  if (loaded_ == nullptr || saving_ || same || facts.kind != platform::FileKind::Regular) return;
+  if (loaded_ == nullptr || saving_ || !loaded_->HasChanged() || !platform::IsRegularFile(list_[place_])) return;
   loader_->Forget(list_[place_]);
   loaded_.reset();
   StartAfresh();

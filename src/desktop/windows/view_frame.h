@@ -9,7 +9,6 @@
 
 #include "desktop/view_picture.h"
 #include "desktop/windows/view_canvas.h"
-#include "platform/files.h"
 
 namespace fotomill::desktop {
 
@@ -67,7 +66,6 @@ class ViewFrame : public wxFrame {
   int32_t page_ = 0;
   Orientation turn_ = Orientation::Upright;  // how the view is turned against the file
   ViewPicturePointer loaded_;                // as the file has it
-  platform::FileFacts loadedFacts_;          // of its file
   bool saving_ = false;
   double keyTime_ = 0;  // when the picture that is awaited was asked for
   bool overlay_ = false;
