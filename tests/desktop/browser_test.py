@@ -28,6 +28,11 @@ def open_select_view(folder):
         # A changed folder shows itself.
         make_pictures(pictures, ["c.bmp"])
         desktop.wait(r"lines=7 .*listing=0 .*focus=broken.gif")
+        # The tip of the file below the pointer.
+        desktop.xdotool("mousemove", 330, 280)
+        desktop.xdotool("mousemove", 335, 285)
+        desktop.wait(r"tip ")
+        desktop.xdotool("mousemove", 5, 5)
         desktop.key("ctrl+f")
         desktop.type("a?.")
         desktop.wait(r"lines=0 items=7")

@@ -13,12 +13,15 @@
 #include "desktop/configuration_transfer.h"
 #include "desktop/exif_report.h"
 #include "desktop/file_history_list.h"
+#include "desktop/file_tip.h"
 #include "desktop/history_dates.h"
 #include "desktop/info_report.h"
 #include "desktop/upkeep.h"
 #include "metadata/exif_text.h"
+#include "picture/registry.h"
 #include "platform/clock.h"
 #include "platform/files.h"
+#include "support/codecs.h"
 #include "support/exif_blocks.h"
 #include "support/files.h"
 #include "support/scoped_settings.h"
@@ -28,6 +31,25 @@ namespace {
 
 using testing::ElementsAre;
 using testing::HasSubstr;
+
+TEST(FileTip, TellsFactsOrWhatIsWrong) {
+  const test::TemporaryFolder folder;
+  const PicturePointer picture = test::PatternPicture(40, 30, 24);
+  const std::string words = "holiday";
+  picture->comment.assign(words.begin(), words.end());
+  ASSERT_EQ(WritePicture(*picture, folder.Path("a.jpg"), {}), Status::Ok);
+  test::WriteText(folder.Path("b.gif"), "GIF89a and no more");
+  const auto last = [&](const char* name, Status known) {
+    FolderItem item;
+    item.name = name;
+    const std::vector<std::string> lines = FileTipLines(folder.Path(), item, known);
+    return std::vector<std::string>(lines.begin() + 3, lines.end());
+  };
+  using Lines = std::vector<std::string>;
+  EXPECT_EQ(last("a.jpg", Status::Ok), (Lines{"40 x 30 pixels, 24 bits", "holiday"}));
+  EXPECT_EQ(last("a.jpg", Status::DamagedFile).front(), StatusMessage(Status::DamagedFile));
+  EXPECT_EQ(last("b.gif", Status::Ok).size(), 1u);
+}
 
 // A data folder and settings of its own.
 class Reports : public testing::Test {

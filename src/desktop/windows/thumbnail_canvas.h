@@ -10,6 +10,7 @@
 
 #include "desktop/browser_model.h"
 #include "desktop/cell_layout.h"
+#include "desktop/windows/hover_tip.h"
 #include "desktop/windows/thumbnail_service.h"
 
 class wxDC;
@@ -47,6 +48,7 @@ class ThumbnailCanvas : public wxWindow {
   bool ListsNames() const;
 
  private:
+  static constexpr int kPadding = 6;  // inside a cell, device-independent pixels
   struct Looks;
   void OnPaint(wxPaintEvent&);
   void Paint();
@@ -102,8 +104,8 @@ class ThumbnailCanvas : public wxWindow {
   wxPoint bandEnd_;
   std::string typed_;
   double typedAt_ = 0;
-  size_t tipLine_ = kNoLine;
   wxTimer bandTimer_;
+  HoverTip tip_;
   wxTextCtrl* editor_ = nullptr;
   size_t editedLine_ = kNoLine;
 };
