@@ -203,9 +203,10 @@ std::vector<std::string> BrowserModel::ShownFiles() const {
   return files;
 }
 
-void BrowserModel::SelectMatching(std::string_view pattern) {
+void BrowserModel::SelectMatching(std::string_view pattern, MatchMode mode) {
   for (size_t line = 0; line < lines_.size(); ++line) {
-    selection_.Set(line, !pattern.empty() && MatchesFilter(Line(line).name, pattern));
+    const bool matches = !pattern.empty() && MatchesFilter(Line(line).name, pattern);
+    if (matches || mode == MatchMode::Only) selection_.Set(line, matches && mode != MatchMode::TakeOut);
   }
 }
 

@@ -12,6 +12,9 @@
 
 namespace fotomill::desktop {
 
+// What becomes of the selection of lines whose names match a pattern: they alone are selected, they as well, or not any more.
+enum class MatchMode { Only, Add, TakeOut };
+
 // What one browser shows: the items of a folder in their order, those that pass the filter as lines, and the selection
 // among the lines. No window, no file access.
 class BrowserModel {
@@ -57,7 +60,7 @@ class BrowserModel {
   bool HasFileForFunction() const;
   // All files that are shown, in list order.
   std::vector<std::string> ShownFiles() const;
-  void SelectMatching(std::string_view pattern);
+  void SelectMatching(std::string_view pattern, MatchMode mode);
   void SelectSameType();
 
   // "312 files, 4 selected, 18.2 MB"

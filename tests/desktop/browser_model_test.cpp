@@ -144,6 +144,11 @@ TEST(BrowserModel, TypingFinds) {
   EXPECT_EQ(model.FindTyped("ac", false), 1u);
   EXPECT_EQ(model.FindTyped("ad", false), 2u);
   EXPECT_EQ(model.FindTyped("x", true), kNoLine);
+  model.SelectMatching("*c.png", MatchMode::Only);
+  model.SelectMatching("a*", MatchMode::Add);
+  model.SelectMatching("ad", MatchMode::TakeOut);
+  EXPECT_EQ(Shown(model), "[ab.png*] ac.png* Ad.png b.png");
+  model.SelectMatching("", MatchMode::Only);
   EXPECT_EQ(model.CountText(), "4 files, 600 bytes");
   EXPECT_EQ(model.FocusText(), "ab.png, 1 of 4");
 }

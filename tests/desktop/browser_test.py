@@ -1,8 +1,20 @@
 #!/usr/bin/env python3
 """The browser and the view window of the real program, by keyboard."""
+import time
+
 from driven_desktop import Desktop, Failure, make_pictures, run
 
 NAMES = ["a1.bmp", "a2.png", "a10.jpg", "b.tif"]
+
+
+def register_program(data, marker):
+    """A program for PNG files that makes a file."""
+    (data / "applications").mkdir(parents=True)
+    (data / "mime").mkdir()
+    (data / "mime/globs2").write_text("50:image/png:*.png\n")
+    (data / "applications/marker.desktop").write_text(
+        f"[Desktop Entry]\nType=Application\nName=Marker\nExec=touch {marker} %F\nMimeType=image/png;\n")
+    (data / "applications/mimeapps.list").write_text("[Default Applications]\nimage/png=marker.desktop\n")
 
 
 def open_select_view(folder):
@@ -10,6 +22,7 @@ def open_select_view(folder):
     make_pictures(pictures, NAMES)
     (pictures / "broken.gif").write_bytes(b"GIF89a and no more")
     (pictures / "sub").mkdir()
+    register_program(folder / "home/.local/share", folder / "opened")
     with Desktop(folder, pictures) as desktop:
         desktop.wait(r"browser tabs=1 lines=6 items=6 selected=0 missing=0 listing=0")
         desktop.screenshot("browser")
@@ -25,9 +38,24 @@ def open_select_view(folder):
         desktop.wait(r"selected=0")
         desktop.key("b", "r")
         desktop.wait(r"selected=1 .*focus=broken.gif")
+        # Selected by pattern, and opened with a program that is registered for PNG files.
+        desktop.key("ctrl+s")
+        desktop.wait("prompt select")
+        desktop.focus("Select by pattern")
+        desktop.type("a*")
+        desktop.key("Return")
+        desktop.wait(r"selected=3 ")
+        desktop.focus("Fotomill Professional")
+        desktop.key("Home", "Right", "Right", "shift+F10")
+        desktop.wait(r"programs [1-9]")
+        desktop.settle()
+        desktop.key("Up", "Right", "Return")
+        desktop.wait(r"open-with Marker$")
+        while not (folder / "opened").exists():
+            time.sleep(0.05)
         # A changed folder shows itself.
         make_pictures(pictures, ["c.bmp"])
-        desktop.wait(r"lines=7 .*listing=0 .*focus=broken.gif")
+        desktop.wait(r"lines=7 .*listing=0 .*focus=a2.png")
         # The tip of the file below the pointer.
         desktop.xdotool("mousemove", 330, 280)
         desktop.xdotool("mousemove", 335, 285)

@@ -6,6 +6,7 @@
 #include "desktop/windows/compare_frame.h"
 #include "desktop/windows/file_actions.h"
 #include "desktop/windows/main_frame.h"
+#include "desktop/windows/select_dialog.h"
 #include "desktop/windows/sequential_rename_dialog.h"
 #include "desktop/windows/tool_windows.h"
 
@@ -51,6 +52,11 @@ void Select(MainFrame& frame) {
   if (browser == nullptr) return;
   (browser->Model().Selected().*action)();
   browser->SelectionChanged();
+}
+
+void SelectByPattern(MainFrame& frame) {
+  BrowserPage* browser = frame.Browser();
+  if (browser != nullptr && AskAndSelect(frame, browser->Model())) browser->SelectionChanged();
 }
 
 void SelectSameType(MainFrame& frame) {
@@ -126,6 +132,7 @@ constexpr Command kCommands[] = {
     {kEdit, "Select &all",         "Ctrl+A",       "Selects all files that are shown.", Needs::Nothing, Select<&Selection::SelectAll>},
     {kEdit, "Select &none",        "Ctrl+Shift+A", "Selects nothing.", Needs::Nothing, Select<&Selection::SelectNone>},
     {kEdit, "&Invert selection",   "Ctrl+I",       "Selects what is not selected.", Needs::Nothing, Select<&Selection::Invert>},
+    {kEdit, "Select by p&attern...", "Ctrl+S",     "Selects files by a part of their names, or a pattern.", Needs::Nothing, SelectByPattern},
     {kEdit, "Select same t&ype",   "",             "Selects all files of the focused file's type.", Needs::Item, SelectSameType},
     {kEdit, nullptr},
     {kEdit, "&Filter",             "Ctrl+F",       "Shows only files whose names match.", Needs::Nothing, OfBrowser<&BrowserPage::EditFilter>},

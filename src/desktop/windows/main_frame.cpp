@@ -20,6 +20,7 @@
 #include "desktop/windows/file_actions.h"
 #include "desktop/windows/folder_drop.h"
 #include "desktop/windows/folder_tree.h"
+#include "desktop/windows/open_with.h"
 #include "desktop/windows/view_frame.h"
 #include "desktop/windows/wx_text.h"
 #include "platform/files.h"
@@ -143,6 +144,10 @@ void MainFrame::ShowContextMenu(wxWindow& window, const wxPoint& place, bool onF
   for (const Command& command : Commands()) {
     if (command.text == nullptr || !command.inContextMenu) continue;
     menu.Append(CommandId(command), MenuText(command), command.help);
+  }
+  if (wxMenu* programs = NewOpenWithMenu(*this, SelectedFiles())) {
+    menu.AppendSeparator();
+    menu.AppendSubMenu(programs, "Open &with");
   }
   window.PopupMenu(&menu, place);
 }

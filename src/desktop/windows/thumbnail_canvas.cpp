@@ -28,6 +28,11 @@ constexpr int kListWidth = 240;       // of a line in the list of names
 constexpr double kTypingPause = 1.0;  // seconds after which typing begins anew
 constexpr size_t kPrecache = 256;     // thumbnails wanted beyond what is near
 
+bool OpensMenu(const wxKeyEvent& event) {
+  const int key = event.GetKeyCode();
+  return key == WXK_WINDOWS_MENU || key == WXK_MENU || (key == WXK_F10 && event.ShiftDown());
+}
+
 }  // namespace
 
 ThumbnailCanvas::ThumbnailCanvas(wxWindow* parent, BrowserModel& model, ThumbnailService& thumbnails, Events events)
@@ -345,7 +350,7 @@ void ThumbnailCanvas::OnKey(wxKeyEvent& event) {
     if (row.key == event.GetKeyCode()) return MoveFocus(row.step, event);
   }
   const size_t focus = model_.Selected().Focus();
-  if (event.GetKeyCode() == WXK_WINDOWS_MENU && focus != kNoLine && events_.contextMenu) {
+  if (OpensMenu(event) && focus != kNoLine && events_.contextMenu) {
     const Rect cell = layout_.Cell(focus);
     return events_.contextMenu(focus, wxPoint(cell.x + cell.width / 2, static_cast<int>(cell.y - scroll_) + cell.height / 2));
   }

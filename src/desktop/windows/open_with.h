@@ -1,0 +1,15 @@
+#pragma once
+
+#include <string>
+#include <vector>
+
+class wxMenu;
+
+namespace fotomill::desktop {
+
+class MainFrame;
+
+// A new menu of the programs registered for files like the first of these; each opens all of them. Null when there are none.
+wxMenu* NewOpenWithMenu(MainFrame& frame, const std::vector<std::string>& files);
+
+}  // namespace fotomill::desktop
