@@ -6,6 +6,7 @@
 #include "desktop/favourites.h"
 #include "desktop/pasted_picture.h"
 #include "desktop/session.h"
+#include "desktop/tab_sets.h"
 #include "picture/registry.h"
 #include "support/files.h"
 #include "support/scoped_environment.h"
@@ -119,6 +120,19 @@ TEST(Favourites, AreKeptInOrderAndFollowRenames) {
   EXPECT_FALSE(favourites.FollowRename("/q", "/z"));
   favourites.Load();
   EXPECT_EQ(favourites.Folders(), (std::vector<std::string>{"/z/c", "/a b"}));
+  SetDataFolder(before);
+}
+
+TEST(TabSets, AreFilesOfTheDataFolder) {
+  const test::TemporaryFolder folder;
+  const std::string before = DataFolder();
+  SetDataFolder(folder.Path());
+  for (const char* file : {"b10.fmwtabset", "b2.fmwtabset", "other.txt"}) WriteText(folder.Path(file), "");
+  EXPECT_THAT(TabSetNames(), ElementsAre("b2", "b10"));
+  for (const char* name : {"", "a/b", ".hidden", "a\nb"}) EXPECT_EQ(TabSetFile(name), "") << name;
+  EXPECT_TRUE(DeleteTabSet("b10"));
+  EXPECT_FALSE(HasTabSet("b10"));
+  EXPECT_FALSE(DeleteTabSet("a/b"));
   SetDataFolder(before);
 }
 

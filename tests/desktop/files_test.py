@@ -104,11 +104,22 @@ def thumbnails_and_session(folder):
         assert (pictures / "a.THN").stat().st_size == 27912
         desktop.key("Home", "Right")
         desktop.wait(r"focus=b.bmp")
+        desktop.key("ctrl+k")
+        desktop.focus("Find")
+        desktop.type("save tabs")
+        desktop.key("Return")
+        desktop.wait(r"prompt tab-set-name")
+        desktop.focus("Save tabs")
+        desktop.type("work")
+        desktop.key("Return")
+        desktop.wait(r"tab-set saved work")
+        desktop.focus("Fotomill Professional")
         desktop.key("ctrl+q")
         desktop.wait_end()
         desktop.arguments = []
         desktop.start()
         desktop.wait(r"browser tabs=2 lines=2 .*listing=0 view=4 .*focus=b.bmp folder=.*pictures$")
+        assert (desktop.data / "work.fmwtabset").read_text().count("[Tab]") == 2
 
 
 def turn_and_take_back(folder):

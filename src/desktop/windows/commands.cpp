@@ -84,6 +84,8 @@ void Turn(MainFrame& frame) {
 void NewTab(MainFrame& frame) { frame.OpenTab(frame.CurrentFolder()); }
 void CloseTab(MainFrame& frame) { frame.CloseTab(); }
 void ReopenTab(MainFrame& frame) { frame.ReopenTab(); }
+void SaveTabSet(MainFrame& frame) { frame.SaveTabSet(); }
+void OpenTabSet(MainFrame& frame) { frame.OpenTabSet(); }
 void NextTab(MainFrame& frame) { frame.StepTab(1); }
 void PreviousTab(MainFrame& frame) { frame.StepTab(-1); }
 void Quit(MainFrame& frame) { frame.Close(); }
@@ -115,6 +117,9 @@ constexpr Command kCommands[] = {
     {kFile, "New &tab",            "Ctrl+T",       "Opens another tab on this folder.", Needs::Nothing, NewTab},
     {kFile, "&Close tab",          "Ctrl+W",       "Closes this tab.", Needs::Nothing, CloseTab},
     {kFile, "&Reopen closed tab",  "Ctrl+Shift+T", "Opens the tab that was closed last.", Needs::ClosedTab, ReopenTab},
+    {kFile, "&Save tabs as...",     "",             "Keeps the tabs under a name.", Needs::Nothing, SaveTabSet},
+    {kFile, "T&ab sets...",         "",             "Opens tabs that were kept under a name.", Needs::Nothing, OpenTabSet},
+    {kFile, nullptr},
     {kFile, "New &folder...",      "Ctrl+Shift+N", "Makes a folder in this one.", Needs::Nothing, NewFolder},
     {kFile, nullptr},
     {kFile, "&Quit",               "Ctrl+Q",       "Ends the program.", Needs::Nothing, Quit},

@@ -10,9 +10,11 @@
 #include <map>
 
 #include "core/configuration.h"
+#include "core/history_list.h"
 #include "core/settings.h"
 #include "desktop/event_log.h"
 #include "desktop/session.h"
+#include "desktop/tab_sets.h"
 #include "desktop/windows/batch_runner.h"
 #include "desktop/windows/bitmaps.h"
 #include "desktop/windows/commands.h"
@@ -21,6 +23,7 @@
 #include "desktop/windows/folder_drop.h"
 #include "desktop/windows/folder_tree.h"
 #include "desktop/windows/open_with.h"
+#include "desktop/windows/tab_set_box.h"
 #include "desktop/windows/view_frame.h"
 #include "desktop/windows/wx_text.h"
 #include "platform/files.h"
@@ -49,6 +52,8 @@ MainFrame::MainFrame()
   SetSize(FromDIP(wxSize(1180, 760)));
   views_.Load();
   favourites_.Load();
+  closedTabs_ = LoadHistoryList(HistoryList::Tabs);
+  std::ranges::reverse(closedTabs_);  // the latest last
   BuildMenus();
   BuildToolbar();
   BuildPanes();
@@ -176,7 +181,7 @@ void MainFrame::BuildPanes() {
   tabs_->Bind(wxEVT_AUINOTEBOOK_PAGE_CHANGED, &MainFrame::OnTabChanged, this);
   tabs_->Bind(wxEVT_AUINOTEBOOK_PAGE_CLOSE, [this](wxAuiNotebookEvent& event) {
     if (tabs_->GetPageCount() == 1) return event.Veto();
-    closedTabs_.push_back(PageAt(static_cast<size_t>(event.GetSelection()))->Model().Folder());
+    NoteClosed(static_cast<size_t>(event.GetSelection()));
   });
   const int place = settings.RememberNavPaneHPosition > 0 ? settings.RememberNavPaneHPosition : 230;
   splitter_->SplitVertically(tree_, tabs_, FromDIP(place));
@@ -229,22 +234,60 @@ bool MainFrame::RestoreSession() {
     SetSize(FromDIP(wxSize(std::max(session.width, 400), std::max(session.height, 300))));
   if (session.maximized) Maximize();
   if (settings.RememberOpenWindows == 0 || session.tabs.empty()) return false;
+  OpenTabs(session);
+  return true;
+}
+
+void MainFrame::OpenTabs(const Session& session) {
+  const size_t first = tabs_->GetPageCount();
   for (const SessionTab& tab : session.tabs) {
     auto* page = new BrowserPage(tabs_, *this, thumbnails_, tab.view);
     tabs_->AddPage(page, Shown(platform::FileNameOf(tab.folder)));
+    tabs_->SetPageToolTip(tabs_->GetPageCount() - 1, Shown(tab.folder));
     page->Open(tab.folder, tab.focus);
     page->RestoreScroll(tab.scroll);
   }
-  tabs_->SetSelection(session.tab);
+  tabs_->SetSelection(first + session.tab);
   if (BrowserPage* browser = Browser()) {
     browser->Activated();
     browser->FocusList();
   }
   BrowserChanged();
-  return true;
 }
 
-void MainFrame::KeepSession() {
+// The tabs under a name of their own, to which they are also written in the end.
+void MainFrame::SaveTabSet() {
+  const auto name = AskForTabSetName(*this);
+  if (!name) return;
+  const SettingText before = std::exchange(settings.TabsetCurrentName, SettingText(TabSetFile(*name)));
+  if (!KeepSession(true)) {
+    settings.TabsetCurrentName = before;
+    wxMessageBox("The tab set could not be written.", kTitle, wxOK | wxICON_WARNING, this);
+    return;
+  }
+  (void)SaveConfiguration();
+  LogEvent("tab-set", "saved " + *name);
+}
+
+// Other tabs come in the place of those that are open, which their own set keeps.
+void MainFrame::OpenTabSet() {
+  const auto name = ChooseTabSet(*this);
+  if (!name || *name == CurrentTabSet()) return;
+  if (!KeepSession(true)) return Tell("The tabs that are open could not be kept, so they stay.");
+  const SettingText before = std::exchange(settings.TabsetCurrentName, SettingText(TabSetFile(*name)));
+  const Session session = LoadSession();
+  if (session.tabs.empty()) {
+    settings.TabsetCurrentName = before;
+    return Tell("The folders of this tab set are not there any more.");
+  }
+  const size_t old = tabs_->GetPageCount();
+  OpenTabs(session);
+  for (size_t tab = 0; tab < old; ++tab) tabs_->DeletePage(0);
+  (void)SaveConfiguration();
+  LogEvent("tab-set", "opened " + *name);
+}
+
+bool MainFrame::KeepSession(bool withTabs) {
   Session session;
   session.maximized = IsMaximized();
   if (session.maximized) {  // the size to come back to is the last one before
@@ -257,20 +300,29 @@ void MainFrame::KeepSession() {
     session.height = size.y;
   }
   session.tab = static_cast<size_t>(std::max(tabs_->GetSelection(), 0));
-  for (size_t tab = 0; tab < tabs_->GetPageCount() && settings.RememberOpenWindows != 0; ++tab) {
+  for (size_t tab = 0; tab < tabs_->GetPageCount() && withTabs; ++tab) {
     const BrowserModel& model = PageAt(tab)->Model();
     const size_t focus = model.Selected().Focus();
     session.tabs.push_back(
         {model.Folder(), model.View(), PageAt(tab)->Scroll(), focus == kNoLine ? std::string() : model.Line(focus).name});
   }
-  (void)SaveSession(session);
   (void)views_.Save();
+  return SaveSession(session);
+}
+
+void MainFrame::NoteClosed(size_t tab) {
+  const std::string folder = PageAt(tab)->Model().Folder();
+  std::erase(closedTabs_, folder);
+  closedTabs_.push_back(folder);
+  const size_t most = static_cast<size_t>(std::max(settings.TabHistoryMax, 1));
+  if (closedTabs_.size() > most) closedTabs_.erase(closedTabs_.begin(), closedTabs_.end() - static_cast<ptrdiff_t>(most));
+  (void)AddToHistoryList(HistoryList::Tabs, folder);
 }
 
 void MainFrame::CloseTab() {
   const int tab = tabs_->GetSelection();
   if (tab == wxNOT_FOUND || tabs_->GetPageCount() == 1) return;
-  closedTabs_.push_back(PageAt(static_cast<size_t>(tab))->Model().Folder());
+  NoteClosed(static_cast<size_t>(tab));
   tabs_->DeletePage(static_cast<size_t>(tab));
 }
 
@@ -278,6 +330,8 @@ void MainFrame::ReopenTab() {
   if (closedTabs_.empty()) return;
   const std::string folder = closedTabs_.back();
   closedTabs_.pop_back();
+  (void)RemoveFromHistoryList(HistoryList::Tabs, folder);
+  if (!platform::IsFolder(folder)) return Tell(folder + " is not there any more.");
   OpenTab(folder);
 }
 
@@ -321,11 +375,9 @@ void MainFrame::BrowserChanged() {
   const BrowserModel& model = browser->Model();
   const wxString name = model.Folder() == "/" ? wxString("/") : Shown(platform::FileNameOf(model.Folder()));
   const size_t tab = static_cast<size_t>(tabs_->GetSelection());
-  if (tabs_->GetPageText(tab) != name) {
-    tabs_->SetPageText(tab, name);
-    tabs_->SetPageToolTip(tab, Shown(model.Folder()));
-    SetTitle(name + " - " + kTitle);
-  }
+  if (tabs_->GetPageText(tab) != name) tabs_->SetPageText(tab, name);
+  if (tabs_->GetPageToolTip(tab) != Shown(model.Folder())) tabs_->SetPageToolTip(tab, Shown(model.Folder()));
+  if (GetTitle() != name + " - " + kTitle) SetTitle(name + " - " + kTitle);
   SetStatusText(Shown(model.CountText()), kCountField);
   tree_->Follow(model.Folder());
   LogState();
@@ -432,7 +484,7 @@ void MainFrame::OnClose(wxCloseEvent& event) {
     if (dialog.ShowModal() != wxID_OK) return event.Veto();
   }
   if (FoldersShown()) settings.RememberNavPaneHPosition = ToDIP(splitter_->GetSashPosition());
-  KeepSession();
+  (void)KeepSession(settings.RememberOpenWindows != 0);
   (void)SaveConfiguration();
   FlushUses();
   event.Skip();

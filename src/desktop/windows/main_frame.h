@@ -21,6 +21,7 @@ class FileActions;
 class FolderTree;
 class ViewFrame;
 struct Command;
+struct Session;
 
 // The program's window: a tab for each browser, the folders at the left, menus and toolbar from the table of commands.
 class MainFrame : public wxFrame, public BrowserHost {
@@ -43,6 +44,9 @@ class MainFrame : public wxFrame, public BrowserHost {
   bool RestoreSession();
   void CloseTab();
   void ReopenTab();
+  // Named sets of tabs.
+  void SaveTabSet();
+  void OpenTabSet();
   void StepTab(int step);
   bool HasClosedTab() const { return !closedTabs_.empty(); }
   void ShowFolders(bool show);
@@ -87,7 +91,10 @@ class MainFrame : public wxFrame, public BrowserHost {
   void OnTabChanged(wxAuiNotebookEvent& event);
   void OnClose(wxCloseEvent& event);
   void LogState();
-  void KeepSession();
+  void OpenTabs(const Session& session);
+  // Writes the tabs, or none, and the frame's size to the set in use. False when that could not be done.
+  [[nodiscard]] bool KeepSession(bool withTabs);
+  void NoteClosed(size_t tab);
   BrowserPage* PageAt(size_t tab) const;
 
   ThumbnailService thumbnails_;
