@@ -7,7 +7,6 @@
 #include "core/settings.h"
 #include "desktop/browser_model.h"
 #include "desktop/photo_facts.h"
-#include "desktop/rgb_image.h"
 #include "desktop/view_transform.h"
 #include "picture/registry.h"
 #include "platform/clock.h"
@@ -17,6 +16,8 @@
 namespace fotomill::desktop {
 
 namespace {
+
+std::vector<uint8_t> screenProfile;
 
 constexpr uint64_t kRecordBytes = 64 * 1024;  // of a decoded picture beside its pixels
 
@@ -35,7 +36,8 @@ Status LoadInto(const ViewWish& wish, ViewPicture& view) {
   picture->page = wish.page;
   RETURN_IF_BAD(ReadPicture(*picture));
   // Before the background joins in, whose colour is the screen's.
-  if (wish.look.profiles && !picture->metadata.icc.empty()) ColourTransform(picture->metadata.icc).Apply(picture->image);
+  const bool profiles = !picture->metadata.icc.empty() || !screenProfile.empty();
+  if (wish.look.profiles && profiles) ColourTransform(picture->metadata.icc, screenProfile).Apply(picture->image);
   if (wish.look.keepAlpha) {
     RETURN_IF_BAD(PrepareWithAlpha(*picture));
   } else {
@@ -54,6 +56,8 @@ Status LoadInto(const ViewWish& wish, ViewPicture& view) {
 
 }  // namespace
 
+void SetScreenProfile(std::vector<uint8_t> profile) { screenProfile = std::move(profile); }
+
 ViewLook ViewLook::FromSettings() { return {settings.ViewModeColorProfiles != 0, settings.ViewModeCheckerboard != 0}; }
 
 uint64_t ViewPicture::Bytes() const {
@@ -71,6 +75,15 @@ std::string SizeAndZoom(const PictureRecord& picture, double scale) {
 bool ViewPicture::HasChanged() const {
   const platform::FileFacts now = platform::FactsOf(wish.path);
   return now.identity != facts.identity || now.device != facts.device || now.size != facts.size || now.modified != facts.modified;
+}
+
+Status PixelsForOthers(const ViewPicture& view, Color background, RgbImage& pixels) {
+  RETURN_IF_BAD(ToRgb(view.picture->image, view.picture->alpha, background, pixels));
+  if (!view.wish.look.profiles || screenProfile.empty()) return Status::Ok;
+  PackedImage image;
+  RETURN_IF_BAD(ToPacked(pixels, image));
+  ColourTransform(screenProfile).Apply(image);
+  return ToRgb(image, pixels);
 }
 
 ViewPicturePointer LoadViewPicture(const ViewWish& wish) {

@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "core/status.h"
+#include "desktop/rgb_image.h"
 #include "picture/picture_record.h"
 #include "platform/files.h"
 #include "processing/orient.h"
@@ -23,6 +24,10 @@ struct ViewLook {
   static ViewLook FromSettings();
   bool operator==(const ViewLook&) const = default;
 };
+
+// The colour profile of the screen that pictures are made for from here on; empty for sRGB. To be told before the first picture
+// is wished for.
+void SetScreenProfile(std::vector<uint8_t> profile);
 
 // A picture as a view window wants it: a page of a file, with the size of the window that it is to fit.
 struct ViewWish {
@@ -57,6 +62,9 @@ using ViewPicturePointer = std::shared_ptr<const ViewPicture>;
 
 // "4000 x 3000 pixels, 3.2 MB, 25%" of a picture at a scale.
 std::string SizeAndZoom(const PictureRecord& picture, double scale);
+
+// A decoded picture's pixels for other programs: on a background, 0x00BBGGRR, and in sRGB whatever the screen's colours are.
+Status PixelsForOthers(const ViewPicture& view, Color background, RgbImage& pixels);
 
 ViewPicturePointer LoadViewPicture(const ViewWish& wish);
 // A turned copy of a picture that was loaded; null where there is no memory for it.

@@ -70,6 +70,11 @@ Profile OpenProfile(std::span<const uint8_t> bytes) {
   return device && (colours == cmsSigRgbData || colours == cmsSigGrayData) ? std::move(profile) : nullptr;
 }
 
+Profile OpenSource(std::span<const uint8_t> bytes) {
+  Profile source = OpenProfile(bytes);
+  return source != nullptr ? std::move(source) : Profile(cmsCreate_sRGBProfile());
+}
+
 Profile OpenScreen(std::span<const uint8_t> bytes) {
   Profile screen = OpenProfile(bytes);
   const bool fits = screen != nullptr && cmsGetColorSpace(screen.get()) == cmsSigRgbData;
@@ -112,10 +117,8 @@ void ForBandsOfRows(int32_t rows, uint64_t pixels, const std::function<void(int3
 }  // namespace
 
 ColourTransform::ColourTransform(std::span<const uint8_t> source, std::span<const uint8_t> screen) {
-  const Profile from = OpenProfile(source);
-  if (from == nullptr) return;
-  const Profile to = OpenScreen(screen);
-  if (to == nullptr) return;
+  const Profile from = OpenSource(source), to = OpenScreen(screen);
+  if (from == nullptr || to == nullptr) return;
   grey_ = cmsGetColorSpace(from.get()) == cmsSigGrayData;
   // Greys are few: they need no short cut, which would cost dark ones their precision.
   const cmsUInt32Number flags = grey_ ? cmsFLAGS_NOCACHE | cmsFLAGS_NOOPTIMIZE : cmsFLAGS_NOCACHE;

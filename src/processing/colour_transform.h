@@ -9,12 +9,12 @@
 namespace fotomill {
 
 // How the colours of an ICC profile become those of a screen, by the profile's perceptual intent. Profiles of RGB and of
-// grey pictures count; one of another kind, one that is damaged, and one whose colours the screen shows as they are (sRGB,
-// mostly) change nothing.
+// grey pictures count; none, one of another kind and one that is damaged stand for sRGB. Where the screen shows the colours as
+// they are, nothing is changed.
 class ColourTransform {
  public:
-  // `source` is the profile of the pictures, `screen` that of the screen, both as files hold them. An empty `screen`, or one
-  // that is of no use, stands for sRGB. Takes from a part of a millisecond to some milliseconds.
+  // `source` is the profile of the pictures, `screen` that of the screen, both as files hold them. Only one of RGB
+  // counts as the latter. Takes from a part of a millisecond to some milliseconds.
   explicit ColourTransform(std::span<const uint8_t> source, std::span<const uint8_t> screen = {});
   ~ColourTransform();
   ColourTransform(const ColourTransform&) = delete;

@@ -72,8 +72,13 @@ TEST(ColourTransform, BringsWideColoursToTheScreen) {
   small.ColorTable()[1] = 200;
   transform.Apply(small);
   EXPECT_NEAR(small.ColorTable()[1], WideInSrgb(0x00c800)[1], 1);
-  // On a screen of the same colours nothing is to be done.
+  // On a screen of the same colours nothing is to be done; on it, pictures without a profile are those of sRGB.
   EXPECT_FALSE(ColourTransform(WideProfile(), WideProfile()).ChangesColours());
+  PackedImage green;
+  ASSERT_EQ(NewPackedImage(1, 1, nullptr, 24, green), Status::Ok);
+  green.Row(0)[1] = 255;
+  ColourTransform({}, WideProfile()).Apply(green);
+  EXPECT_NEAR(green.Row(0)[2], 144, 1);  // the red of sRGB's green in Adobe RGB
 }
 
 TEST(ColourTransform, GreyProfilesAreForGreyPictures) {

@@ -6,9 +6,11 @@
 #include "core/data_folder.h"
 #include "desktop/event_log.h"
 #include "desktop/previous_file.h"
+#include "desktop/view_picture.h"
 #include "desktop/windows/control_names.h"
 #include "desktop/windows/main_frame.h"
 #include "desktop/windows/override_box.h"
+#include "desktop/windows/screen_profile.h"
 #include "desktop/windows/wx_text.h"
 #include "picture/format_switches.h"
 #include "picture/registry.h"
@@ -63,6 +65,9 @@ class App : public wxApp {
     RunFormatStartup();
     EnablePlugins();
     DeleteOldPreviousFiles();
+    std::vector<uint8_t> screen = ReadScreenProfile();
+    LogEvent("screen-profile", std::to_string(screen.size()));
+    SetScreenProfile(std::move(screen));
     const Start start = StartFrom(argument_);
     auto* frame = new MainFrame;
     const bool restored = frame->RestoreSession();

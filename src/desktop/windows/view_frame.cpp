@@ -312,9 +312,7 @@ void ViewFrame::CopyPicture() {
   const ViewPicturePointer& shown = canvas_->Picture();
   if (shown == nullptr || shown->picture == nullptr) return;
   RgbImage pixels;
-  const PictureRecord& picture = *shown->picture;
-  const auto background = static_cast<Color>(settings.ViewModeBackground);
-  if (ToRgb(picture.image, picture.alpha, background, pixels) != Status::Ok) return wxBell();
+  if (PixelsForOthers(*shown, static_cast<Color>(settings.ViewModeBackground), pixels) != Status::Ok) return wxBell();
   const wxClipboardLocker clipboard;
   if (!clipboard || !wxTheClipboard->SetData(new wxBitmapDataObject(BitmapOf(pixels)))) return wxBell();
   SetStatusText("The picture is on the clipboard.");
