@@ -24,6 +24,7 @@ void TakeFrameValue(Session& session, std::string_view key, std::string_view val
   if (key == "Width") session.width = Number(value);
   if (key == "Height") session.height = Number(value);
   if (key == "Maximized") session.maximized = Number(value) != 0;
+  if (key == "Columns") session.columns = value;
   if (key == "Tab") session.tab = static_cast<size_t>(std::max(Number(value), 0));
 }
 
@@ -69,6 +70,7 @@ Session ParseSession(std::string_view text) {
 std::string SessionText(const Session& session) {
   std::string text = "[Frame]\n" + Line("Width", session.width) + Line("Height", session.height) +
                      Line("Maximized", session.maximized ? 1 : 0) + Line("Tab", static_cast<int64_t>(session.tab));
+  if (!session.columns.empty() && FitsLine(session.columns)) text += Line("Columns", session.columns);
   for (const SessionTab& tab : session.tabs) {
     if (!FitsLine(tab.folder)) continue;
     text += "[Tab]\n" + Line("Folder", tab.folder) + Line("ThumbnailMode", tab.view.modes.thumbnails) +

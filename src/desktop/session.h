@@ -11,7 +11,8 @@ namespace fotomill::desktop {
 
 // What is open: the tabs of a frame and its size. Kept as a text in the data folder, under the name TabsetCurrentName:
 //
-//   [Frame]            Width, Height (device-independent pixels), Maximized, Tab (the one in front, from 0)
+//   [Frame]            Width, Height (device-independent pixels), Maximized, Columns (of the details), Tab (the
+//                      one in front, from 0)
 //   [Tab]              Folder, ThumbnailMode, ViewMode, SortMode, Descending, Scroll (pixels), Focus (a name)
 //
 // a line "KEY=VALUE" each; lines that are not understood are passed over.
@@ -26,6 +27,7 @@ struct SessionTab {
 struct Session {
   int32_t width = 0, height = 0;  // 0: nothing is known
   bool maximized = false;
+  std::string columns;  // of the details
   size_t tab = 0;
   std::vector<SessionTab> tabs;
 

@@ -4,6 +4,7 @@
 
 #include "core/choice_lists.h"
 #include "desktop/cell_layout.h"
+#include "desktop/detail_columns.h"
 #include "desktop/folder_trail.h"
 #include "desktop/natural_order.h"
 #include "desktop/path_crumbs.h"
@@ -134,6 +135,21 @@ TEST(PathBar, CrumbsAndTrail) {
   EXPECT_TRUE(trail.CanStep(-99));
   EXPECT_FALSE(trail.CanStep(-100));
   EXPECT_EQ(trail.FolderAt(-99), "/50");
+}
+
+TEST(DetailColumns, AreArrangedByAText) {
+  const DetailColumns all = ParseDetailColumns("");
+  ASSERT_EQ(all.size(), AllDetails().size());
+  const DetailColumns arranged = ParseDetailColumns("Size:99,-Name:300,nonsense,-Type:9999999,Size:1,Depth:x,Gone:3");
+  ASSERT_EQ(arranged.size(), all.size());
+  EXPECT_EQ(arranged[0], (DetailColumn{2, 99, true}));
+  EXPECT_EQ(arranged[1], (DetailColumn{0, 300, true}));  // the names cannot be hidden
+  EXPECT_EQ(arranged[2], (DetailColumn{1, 4000, false}));
+  EXPECT_EQ(arranged[3], all[3]);
+  EXPECT_EQ(ParseDetailColumns(DetailColumnsText(arranged)), arranged);
+  FolderItem item;
+  item.taken = 20040831223208;
+  EXPECT_EQ(AllDetails().back().text(item), "2004-08-31 22:32");
 }
 
 TEST(BrowserModel, TypingFinds) {

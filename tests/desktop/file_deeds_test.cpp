@@ -165,7 +165,7 @@ TEST_F(FileDeedsTest, APastedPictureTakesAFreeName) {
 }
 
 TEST(Session, ComesBackAndForgivesOddLines) {
-  Session session{900, 600, true, 1, {{"/a=b [Tab]", {{1, 4, 3}, true}, 1234, "x.png"}, {"/c", {}, 0, ""}}};
+  Session session{900, 600, true, "Size:9", 1, {{"/a=b [Tab]", {{1, 4, 3}, true}, 1234, "x.png"}, {"/c", {}, 0, ""}}};
   EXPECT_EQ(ParseSession(SessionText(session)), session);
   session.tabs[1].folder = "/new\nline";
   EXPECT_EQ(ParseSession(SessionText(session)).tabs.size(), 1u);

@@ -208,13 +208,17 @@ void BrowserPage::ShowView() {
     events.activated = [this](size_t line) { Activate(line); };
     events.contextMenu = [this](size_t line, const wxPoint& place) { host_.ShowContextMenu(*details_, place, line != kNoLine); };
     events.sort = [this](int32_t sort) { SetSort(sort, model_.Modes().sort == sort && !model_.Descending()); };
-    details_ = new DetailsList(views_, model_, events);
+    details_ = new DetailsList(views_, model_, host_.Columns(), events);
     views_->AddPage(details_, "Details");
   }
   const bool hadFocus = canvas_->HasFocus() || (details_ != nullptr && details_->HasFocus());
   views_->SetSelection(details ? kDetailsView : kThumbnailView);
   ShowLines();
-  if (!details) canvas_->ShowLine(model_.Selected().Focus());
+  if (details) {
+    details_->ShowSelection();
+  } else {
+    canvas_->ShowLine(model_.Selected().Focus());
+  }
   if (hadFocus) FocusList();
   StartFacts();
 }
@@ -292,6 +296,15 @@ void BrowserPage::EditFocusedName() {
 void BrowserPage::EditPath() { path_->Edit(); }
 void BrowserPage::OfferTrail() { path_->OfferTrail(); }
 
+void BrowserPage::ChooseColumns() {
+  if (!ShowsDetails()) SetViewMode(choice::kViewDetails);
+  details_->ChooseColumns();
+}
+
+void BrowserPage::KeepColumns() {
+  if (details_ != nullptr) details_->KeepColumns();
+}
+
 void BrowserPage::EditFilter() { filter_->SetFocus(); }
 
 void BrowserPage::ApplyFilter() {
@@ -308,6 +321,7 @@ void BrowserPage::LeaveBar() {
 void BrowserPage::Activated() {
   thumbnails_.SetListener([this](const std::vector<ThumbnailLoader::Result>& results) { ThumbnailsCame(results); });
   canvas_->WantThumbnails();
+  if (details_ != nullptr) details_->ShowColumns();
 }
 
 void BrowserPage::ThumbnailsCame(const std::vector<ThumbnailLoader::Result>& results) {

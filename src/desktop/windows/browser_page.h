@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "desktop/browser_model.h"
+#include "desktop/detail_columns.h"
 #include "desktop/folder_trail.h"
 #include "desktop/windows/folder_reader.h"
 #include "desktop/windows/folder_watch.h"
@@ -25,8 +26,9 @@ class ThumbnailCanvas;
 class BrowserHost {
  public:
   virtual ~BrowserHost() = default;
-  virtual void BrowserChanged() = 0;  // folder, selection, modes or counts
-  virtual FolderViews& Views() = 0;   // how folders are to be shown
+  virtual void BrowserChanged() = 0;     // folder, selection, modes or counts
+  virtual DetailColumns& Columns() = 0;  // of the details of all browsers
+  virtual FolderViews& Views() = 0;      // how folders are to be shown
   virtual void ViewFile(const std::string& path) = 0;
   virtual void ShowContextMenu(wxWindow& window, const wxPoint& place, bool onFile) = 0;
   virtual void RenameFile(const std::string& path, const std::string& name) = 0;
@@ -62,6 +64,10 @@ class BrowserPage : public wxPanel {
   void EditPath();
   void OfferTrail();
   void EditFilter();
+  // Lets the user choose the columns of the details, which are then shown.
+  void ChooseColumns();
+  // Takes down how the columns are arranged here.
+  void KeepColumns();
   // This browser comes to the front.
   void Activated();
   void FocusList();

@@ -162,6 +162,7 @@ constexpr Command kCommands[] = {
     {kView, "Thumbnails: glo&bal database", "",    "Thumbnails come from the database in the data folder.", Needs::Nothing, ThumbnailsFrom<choice::kGlobalDatabase>, nullptr, false, Has<&BrowserModes::thumbnails, choice::kGlobalDatabase>},
     {kView, "Thumbnails: lo&cal database", "",     "Thumbnails come from the database in the folder.", Needs::Nothing, ThumbnailsFrom<choice::kLocalDatabase>, nullptr, false, Has<&BrowserModes::thumbnails, choice::kLocalDatabase>},
     {kView, nullptr},
+    {kView, "Columns of the detai&ls...", "",      "Lets you choose the columns of the details.", Needs::Nothing, OfBrowser<&BrowserPage::ChooseColumns>},
     {kView, "&Folders",            "F9",           "Shows or hides the folders at the left.", Needs::Nothing, ToggleFolders, nullptr, false, HasFolders},
     {kView, "&Refresh",            "F5",           "Reads the folders again.", Needs::Nothing, ReadFoldersAgain},
 

@@ -1,49 +1,21 @@
 #include "desktop/windows/details_list.h"
 
-#include "core/choice_lists.h"
-#include "core/settings.h"
-#include "core/text.h"
+#include <wx/menu.h>
+
+#include <algorithm>
+
+#include "desktop/event_log.h"
 #include "desktop/windows/wx_text.h"
-#include "picture/registry.h"
 
 namespace fotomill::desktop {
-
-namespace {
-
-std::string DimensionsText(const FolderItem& item) {
-  return item.width == 0 ? std::string() : std::to_string(item.width) + " x " + std::to_string(item.height);
-}
-
-struct Column {
-  const char* title;
-  int width;  // device-independent pixels
-  wxAlignment alignment;
-  int32_t sort;  // choice::SortMode
-  std::string (*text)(const FolderItem& item);
-};
-
-constexpr Column kColumns[] = {
-    {"Name", 260, wxALIGN_LEFT, choice::kSortName, [](const FolderItem& item) { return item.name; }},
-    {"Type", 190, wxALIGN_LEFT, choice::kSortType,
-     [](const FolderItem& item) { return item.folder ? std::string("Folder") : DescribeFileType(item.name); }},
-    {"Size", 110, wxALIGN_RIGHT, choice::kSortSize,
-     [](const FolderItem& item) { return item.folder ? std::string() : SizeText(item.size, settings.DetailSizeMode); }},
-    {"Date", 140, wxALIGN_LEFT, choice::kSortDate,
-     [](const FolderItem& item) { return item.modified == 0 ? std::string() : DateText(item.modified); }},
-    {"Dimensions", 110, wxALIGN_RIGHT, choice::kSortDimensions, DimensionsText},
-    {"Depth", 70, wxALIGN_RIGHT, -1,
-     [](const FolderItem& item) { return item.bits == 0 ? std::string() : std::to_string(item.bits) + " bits"; }},
-};
-
-}  // namespace
 
 class DetailsList::Lines : public wxDataViewVirtualListModel {
  public:
   explicit Lines(const BrowserModel& model) : model_(model) {}
-  unsigned int GetColumnCount() const { return static_cast<unsigned>(std::size(kColumns)); }
+  unsigned int GetColumnCount() const { return static_cast<unsigned>(AllDetails().size()); }
   wxString GetColumnType(unsigned int) const { return "string"; }
   void GetValueByRow(wxVariant& value, unsigned int row, unsigned int column) const override {
-    value = row < model_.LineCount() ? Shown(kColumns[column].text(model_.Line(row))) : wxString();
+    value = row < model_.LineCount() ? Shown(AllDetails()[column].text(model_.Line(row))) : wxString();
   }
   bool SetValueByRow(const wxVariant&, unsigned int, unsigned int) override { return false; }
 
@@ -51,20 +23,15 @@ class DetailsList::Lines : public wxDataViewVirtualListModel {
   const BrowserModel& model_;
 };
 
-DetailsList::DetailsList(wxWindow* parent, BrowserModel& model, Events events)
+DetailsList::DetailsList(wxWindow* parent, BrowserModel& model, DetailColumns& columns, Events events)
     : wxDataViewCtrl(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxDV_MULTIPLE | wxDV_ROW_LINES | wxBORDER_NONE,
                      wxDefaultValidator, "Details"),
       model_(model),
+      columns_(columns),
       events_(std::move(events)),
       lines_(new Lines(model)) {
   AssociateModel(lines_.get());
-  for (const Column& column : kColumns) {
-    auto* added =
-        new wxDataViewColumn(column.title, new wxDataViewTextRenderer("string", wxDATAVIEW_CELL_INERT, column.alignment),
-                             static_cast<unsigned>(&column - kColumns), FromDIP(column.width), column.alignment,
-                             wxDATAVIEW_COL_RESIZABLE | wxDATAVIEW_COL_REORDERABLE);
-    AppendColumn(added);
-  }
+  ShowColumns();
   Bind(wxEVT_DATAVIEW_SELECTION_CHANGED, [this](wxDataViewEvent&) { ReadSelection(); });
   Bind(wxEVT_DATAVIEW_ITEM_ACTIVATED, [this](wxDataViewEvent& event) {
     if (event.GetItem().IsOk()) events_.activated(lines_->GetRow(event.GetItem()));
@@ -74,16 +41,81 @@ DetailsList::DetailsList(wxWindow* parent, BrowserModel& model, Events events)
     events_.contextMenu(line, ScreenToClient(wxGetMousePosition()));
   });
   Bind(wxEVT_DATAVIEW_COLUMN_HEADER_CLICK, [this](wxDataViewEvent& event) {
-    const int32_t sort = kColumns[event.GetDataViewColumn()->GetModelColumn()].sort;
+    const int32_t sort = AllDetails()[event.GetDataViewColumn()->GetModelColumn()].sort;
     if (sort >= 0) events_.sort(sort);
   });
+  Bind(wxEVT_DATAVIEW_COLUMN_HEADER_RIGHT_CLICK, [this](wxDataViewEvent&) { CallAfter([this] { ChooseColumns(); }); });
 }
 
-void DetailsList::ModelChanged() {
+// --- columns ---
+
+void DetailsList::ShowColumns() {
+  if (shown_ == columns_) return;
+  ClearColumns();
+  for (const DetailColumn& column : columns_) {
+    const DetailFacts& facts = AllDetails()[column.detail];
+    const wxAlignment alignment = facts.number ? wxALIGN_RIGHT : wxALIGN_LEFT;
+    auto* added = new wxDataViewColumn(facts.title, new wxDataViewTextRenderer("string", wxDATAVIEW_CELL_INERT, alignment),
+                                       static_cast<unsigned>(column.detail), FromDIP(column.width), alignment,
+                                       wxDATAVIEW_COL_RESIZABLE | wxDATAVIEW_COL_REORDERABLE);
+    added->SetHidden(!column.shown);
+    AppendColumn(added);
+  }
+  shown_ = columns_;
+}
+
+void DetailsList::KeepColumns() {
+  DetailColumns now;
+  for (unsigned i = 0; i < GetColumnCount(); ++i) {
+    const wxDataViewColumn* const column = GetColumn(i);
+    const size_t detail = column->GetModelColumn();
+    const auto before = std::ranges::find(shown_, detail, &DetailColumn::detail);
+    // A hidden column has no width, and the last one shown fills the list up.
+    const bool measured = column->IsShown() && column->GetWidth() > 0;
+    now.push_back({detail, measured ? ToDIP(column->GetWidth()) : before->width, column->IsShown()});
+  }
+  if (now.size() != shown_.size()) return;
+  const auto last = std::find_if(now.rbegin(), now.rend(), [](const DetailColumn& column) { return column.shown; });
+  if (last != now.rend()) last->width = std::ranges::find(shown_, last->detail, &DetailColumn::detail)->width;
+  columns_ = shown_ = now;
+}
+
+void DetailsList::ChooseColumns() {
+  wxMenu menu;
+  const int first = wxID_HIGHEST + 1;
+  KeepColumns();
+  for (const DetailColumn& column : columns_) {
+    wxMenuItem* item = menu.AppendCheckItem(first + static_cast<int>(column.detail), AllDetails()[column.detail].title);
+    item->Check(column.shown);
+    item->Enable(column.detail != 0);
+  }
+  LogEvent("column-menu");
+  const int chosen = GetPopupMenuSelectionFromUser(menu, ScreenToClient(wxGetMousePosition()));
+  if (chosen < first) return;
+  const auto column = std::ranges::find(columns_, static_cast<size_t>(chosen - first), &DetailColumn::detail);
+  column->shown = !column->shown;
+  ShowColumns();
+  ModelChanged();
+  LogEvent("columns", DetailColumnsText(columns_));
+}
+
+// --- lines ---
+
+void DetailsList::ShowLines() {
   changing_ = true;
   lines_->Reset(static_cast<unsigned>(model_.LineCount()));
   changing_ = false;
+}
+
+// What stood at the top stays there, as far as it goes.
+void DetailsList::ModelChanged() {
+  const wxDataViewItem top = GetTopItem();
+  const unsigned row = top.IsOk() ? lines_->GetRow(top) : 0;
+  ShowLines();
   ShowSelection();
+  if (row == 0 || row >= model_.LineCount()) return;
+  EnsureVisible(lines_->GetItem(static_cast<unsigned>(model_.LineCount()) - 1));
+  EnsureVisible(lines_->GetItem(row));
 }
 
 void DetailsList::ShowSelection() {

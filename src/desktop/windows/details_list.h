@@ -5,6 +5,7 @@
 #include <functional>
 
 #include "desktop/browser_model.h"
+#include "desktop/detail_columns.h"
 
 namespace fotomill::desktop {
 
@@ -19,18 +20,27 @@ class DetailsList : public wxDataViewCtrl {
     std::function<void()> dragBegins;
   };
 
-  DetailsList(wxWindow* parent, BrowserModel& model, Events events);
+  // `columns` are the frame's: all lists show the same.
+  DetailsList(wxWindow* parent, BrowserModel& model, DetailColumns& columns, Events events);
 
   // Other lines, another order or other facts.
   void ModelChanged();
   // Marks what the model has selected and shows the focused line.
   void ShowSelection();
+  // Shows the columns as they are arranged, and takes down how the user has arranged them here.
+  void ShowColumns();
+  void KeepColumns();
+  // Lets the user choose the columns from a menu.
+  void ChooseColumns();
 
  private:
   class Lines;
   void ReadSelection();
+  void ShowLines();
 
   BrowserModel& model_;
+  DetailColumns& columns_;
+  DetailColumns shown_;  // as they stand in the list
   const Events events_;
   wxObjectDataPtr<Lines> lines_;
   bool changing_ = false;  // what the list tells now is what it was told

@@ -233,6 +233,7 @@ bool MainFrame::RestoreSession() {
   if (session.width > 0 && session.height > 0)
     SetSize(FromDIP(wxSize(std::max(session.width, 400), std::max(session.height, 300))));
   if (session.maximized) Maximize();
+  columns_ = ParseDetailColumns(session.columns);
   if (settings.RememberOpenWindows == 0 || session.tabs.empty()) return false;
   OpenTabs(session);
   return true;
@@ -300,6 +301,8 @@ bool MainFrame::KeepSession(bool withTabs) {
     session.height = size.y;
   }
   session.tab = static_cast<size_t>(std::max(tabs_->GetSelection(), 0));
+  if (BrowserPage* browser = Browser()) browser->KeepColumns();
+  session.columns = DetailColumnsText(columns_);
   for (size_t tab = 0; tab < tabs_->GetPageCount() && withTabs; ++tab) {
     const BrowserModel& model = PageAt(tab)->Model();
     const size_t focus = model.Selected().Focus();
@@ -341,6 +344,8 @@ void MainFrame::StepTab(int step) {
 }
 
 void MainFrame::OnTabChanged(wxAuiNotebookEvent& event) {
+  const int left = event.GetOldSelection();
+  if (left != wxNOT_FOUND && static_cast<size_t>(left) < tabs_->GetPageCount()) PageAt(static_cast<size_t>(left))->KeepColumns();
   for (wxWindow* const window : tabs_->GetChildren()) {
     if (wxDynamicCast(window, wxAuiTabCtrl) != nullptr) window->SetName("Tabs");
   }

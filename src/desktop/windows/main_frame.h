@@ -77,6 +77,7 @@ class MainFrame : public wxFrame, public BrowserHost {
 
   // BrowserHost
   void BrowserChanged() override;
+  DetailColumns& Columns() override { return columns_; }
   FolderViews& Views() override { return views_; }
   void ViewFile(const std::string& path) override;
   void ShowContextMenu(wxWindow& window, const wxPoint& place, bool onFile) override;
@@ -99,6 +100,7 @@ class MainFrame : public wxFrame, public BrowserHost {
 
   ThumbnailService thumbnails_;
   FolderViews views_;
+  DetailColumns columns_ = ParseDetailColumns({});
   Favourites favourites_;
   wxSplitterWindow* splitter_ = nullptr;
   FolderTree* tree_ = nullptr;
