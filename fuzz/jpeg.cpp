@@ -8,7 +8,7 @@ namespace {
 using namespace fotomill;
 
 // A file that could be turned is a sound head of a JPEG file, and its EXIF, whatever it was, can be edited again.
-void Turn(std::span<const uint8_t> file) {
+void TurnFile(std::span<const uint8_t> file) {
   const uint8_t choice = file.empty() ? uint8_t{0} : file.back();
   std::vector<uint8_t> made;
   JpegTurnResult result;
@@ -22,6 +22,6 @@ void Turn(std::span<const uint8_t> file) {
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
   fotomill::fuzz::TryCodec("jpg", data, size);
-  Turn({data, size});
+  TurnFile({data, size});
   return 0;
 }

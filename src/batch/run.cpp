@@ -1,26 +1,20 @@
 #include "batch/run.h"
 
 #include <algorithm>
-#include <atomic>
-#include <memory>
 #include <mutex>
-#include <new>
 #include <optional>
 
 #include "batch/abort.h"
 #include "batch/destination_name.h"
-#include "batch/ordered_run.h"
 #include "batch/picture_failure.h"
 #include "batch/prompts.h"
+#include "batch/reported_run.h"
 #include "batch/run_names.h"
-#include "core/settings.h"
 #include "core/text.h"
 #include "metadata/picture_exif.h"
 #include "picture/registry.h"
-#include "platform/clock.h"
 #include "platform/files.h"
 #include "platform/paths.h"
-#include "platform/process.h"
 #include "platform/volumes.h"
 #include "processing/reduce.h"
 
@@ -55,21 +49,15 @@ class Batch {
         job_(job),
         prefix_(function.prefix ? *function.prefix : std::string(PrefixOf(function.history))),
         asksEveryName_(AsksEveryName(job)),
-        outcomes_(files.size()) {
+        run_(files, job,
+             {.process = [this](size_t i) { return Process(i); }, .history = function.history, .dryRun = function.dryRun}) {
     for (const BatchFile& file : files_) {
       if (file.status == Status::Ok) names_.AddSource(file.name, Planned(file));
     }
     TakeRules();
   }
 
-  void Run() {
-    OrderedRun run({.work = [this](size_t i) { Work(i); },
-                    .deliver = [this](size_t i) { Deliver(i); },
-                    .goesOn = [this] { return !ended_ && !AbortAsked(); },
-                    .tick = [this] { Tick(); }});
-    run_ = &run;
-    run.Run(files_.size(), function_.jobs == 0 ? platform::CoreCount() : function_.jobs);
-  }
+  void Run() { run_.Run(function_.jobs); }
 
  private:
   // What decides about a collision, as it stood when the last question was answered.
@@ -86,43 +74,7 @@ class Batch {
     return PlannedDestination(file.name, function_.keepTree ? file.below : std::string(), prefix_, job_);
   }
 
-  // On any thread: one file from its source to its output.
-  void Work(size_t i) {
-    std::optional<FileOutcome> outcome;
-    try {
-      outcome = Process(i);
-    } catch (const std::bad_alloc&) {
-      outcome = Failure(files_[i], Status::MemoryAllocationError);
-    }
-    if (outcome) outcomes_[i] = std::make_unique<FileOutcome>(std::move(*outcome));
-  }
-
-  // On the calling thread, in the order of the selection.
-  void Deliver(size_t i) {
-    const std::unique_ptr<FileOutcome> outcome = std::move(outcomes_[i]);
-    if (outcome == nullptr) return;
-    job_.source.AssignCut(outcome->source);
-    const bool written = !outcome->destination.empty() && !outcome->skipped && !function_.dryRun;
-    if (written) NoteUse(outcome->source);
-    job_.filesChanged = job_.filesChanged || written;
-    if (outcome->skipped && outcome->status != Status::Ok) ++job_.writeAborts;
-    ReportOutcome(job_, *outcome, static_cast<uint32_t>(i), static_cast<uint32_t>(files_.size()));
-    if (job_.box != nullptr && !job_.box->GoesOn()) ended_ = true;
-  }
-
-  void Tick() {
-    if (job_.box == nullptr) return;
-    job_.box->Tick();
-    if (!job_.box->GoesOn()) ended_ = true;
-  }
-
-  void NoteUse(const std::string& source) {
-    if ((settings.FileHistoryFunctions >> static_cast<int32_t>(function_.history) & 1) == 0) return;
-    const auto now = static_cast<int32_t>(platform::Now());
-    job_.uses.push_back({names_.Key(source), function_.history, kOwnTime, now, false});
-  }
-
-  // nullopt for a file that was given up by Abort before it had a name.
+  // On any thread: one file from its source to its output. nullopt where it was given up by Abort before it had a name.
   std::optional<FileOutcome> Process(size_t i) {
     const BatchFile& file = files_[i];
     if (file.status != Status::Ok) return Failure(file, file.status, file.hint);
@@ -130,7 +82,7 @@ class Batch {
     destination.path = Planned(file);
     if (destination.path.size() > PathText::Capacity()) return Failure(file, Status::InvalidDestination, kTooLong);
     // Where another file's output may take this source's place, the order of the selection says which comes first.
-    if (names_.IsOutputOfOthers(file.name, destination.path) && !run_->InTurn(i, [] {})) return std::nullopt;
+    if (names_.IsOutputOfOthers(file.name, destination.path) && !run_.InTurn(i, [] {})) return std::nullopt;
     if (IsLeftOut(i, destination)) return Skipped(file, destination);
     PicturePointer picture;
     if (const Status status = Load(file.name, picture); status != Status::Ok) {
@@ -164,7 +116,7 @@ class Batch {
       if (!rules_.overwrite.skip) return false;
       if (IsIndependent(source, destination.path)) return destination.taken = names_.Taken(destination.path, source);
     }
-    (void)run_->InTurn(i, [&] { destination.taken = IsTaken(destination.path, source); });
+    (void)run_.InTurn(i, [&] { destination.taken = IsTaken(destination.path, source); });
     return destination.taken;
   }
 
@@ -224,7 +176,7 @@ class Batch {
   DestinationAnswer Settle(size_t i, Destination& destination, const PictureRecord& picture, bool& cancelled) {
     DestinationAnswer answer = DestinationAnswer::Skip;
     if (SettleAtOnce(files_[i].name, destination, answer)) return answer;
-    const bool done = run_->InTurn(i, [&] { answer = SettleInTurn(files_[i].name, destination, picture, cancelled); });
+    const bool done = run_.InTurn(i, [&] { answer = SettleInTurn(files_[i].name, destination, picture, cancelled); });
     cancelled = cancelled || !done;
     return answer;
   }
@@ -358,12 +310,10 @@ class Batch {
   BatchJob& job_;
   const std::string prefix_;
   const bool asksEveryName_;
-  std::vector<std::unique_ptr<FileOutcome>> outcomes_;  // of files that are done and not yet reported; null: given up
-  OrderedRun* run_ = nullptr;
-  std::atomic<bool> ended_{false};
   mutable std::mutex mutex_;  // over what follows
   RunNames names_;
   Rules rules_;
+  ReportedRun run_;  // last: its threads use the rest
 };
 
 }  // namespace

@@ -49,7 +49,7 @@ bool LookTheSame(const PictureRecord& a, const PictureRecord& b) {
 std::string Obstacle(const PictureRecord& picture) {
   if (!CanWrite(FormatRow(picture.formatIndex))) return "Files of this format cannot be written.";
   if (picture.pageCount > 1) return "It holds several pictures, of which only one would be left.";
-  if (picture.simplified) return "It holds finer colors than can be written again.";
+  if (picture.simplified) return "It holds more than would be written again.";
   if (!picture.warning.empty()) return "It is damaged, though it can be shown.";
   return {};
 }

@@ -1,22 +1,14 @@
 #include "batch/turn_run.h"
 
-#include <atomic>
-#include <memory>
 #include <mutex>
-#include <new>
 #include <optional>
 #include <utility>
-#include <vector>
 
-#include "batch/abort.h"
 #include "batch/destination_name.h"
-#include "batch/ordered_run.h"
+#include "batch/reported_run.h"
 #include "batch/run_names.h"
-#include "core/settings.h"
-#include "platform/clock.h"
 #include "platform/files.h"
 #include "platform/paths.h"
-#include "platform/process.h"
 
 namespace fotomill {
 
@@ -29,20 +21,18 @@ FileOutcome Failure(const BatchFile& file, Status status, std::string hint) {
 class TurnBatch {
  public:
   TurnBatch(std::span<const BatchFile> files, const TurnFunction& function, BatchJob& job)
-      : files_(files), function_(function), job_(job), outcomes_(files.size()) {
+      : files_(files),
+        function_(function),
+        job_(job),
+        run_(
+            files, job,
+            {.process = [this](size_t i) { return Process(i); }, .history = FileFunction::Transform, .dryRun = function.dryRun}) {
     for (const BatchFile& file : files_) {
       if (file.status == Status::Ok) names_.AddSource(file.name, Planned(file));
     }
   }
 
-  void Run() {
-    OrderedRun run({.work = [this](size_t i) { Work(i); },
-                    .deliver = [this](size_t i) { Deliver(i); },
-                    .goesOn = [this] { return !ended_ && !AbortAsked(); },
-                    .tick = [this] { Tick(); }});
-    run_ = &run;
-    run.Run(files_.size(), function_.jobs == 0 ? platform::CoreCount() : function_.jobs);
-  }
+  void Run() { run_.Run(function_.jobs); }
 
  private:
   std::string Planned(const BatchFile& file) const {
@@ -53,40 +43,7 @@ class TurnBatch {
     return platform::JoinFolder(folder, platform::FileNameOf(file.name));
   }
 
-  void Work(size_t i) {
-    std::optional<FileOutcome> outcome;
-    try {
-      outcome = Process(i);
-    } catch (const std::bad_alloc&) {
-      outcome = Failure(files_[i], Status::MemoryAllocationError, {});
-    }
-    if (outcome) outcomes_[i] = std::make_unique<FileOutcome>(std::move(*outcome));
-  }
-
-  void Deliver(size_t i) {
-    const std::unique_ptr<FileOutcome> outcome = std::move(outcomes_[i]);
-    if (outcome == nullptr) return;
-    job_.source.AssignCut(outcome->source);
-    const bool written = !outcome->destination.empty() && !outcome->skipped && !function_.dryRun;
-    if (written) NoteUse(outcome->source);
-    job_.filesChanged = job_.filesChanged || written;
-    if (outcome->skipped && outcome->status != Status::Ok) ++job_.writeAborts;
-    ReportOutcome(job_, *outcome, static_cast<uint32_t>(i), static_cast<uint32_t>(files_.size()));
-    if (job_.box != nullptr && !job_.box->GoesOn()) ended_ = true;
-  }
-
-  void Tick() {
-    if (job_.box == nullptr) return;
-    job_.box->Tick();
-    if (!job_.box->GoesOn()) ended_ = true;
-  }
-
-  void NoteUse(const std::string& source) {
-    if ((settings.FileHistoryFunctions >> static_cast<int32_t>(FileFunction::Transform) & 1) == 0) return;
-    job_.uses.push_back({names_.Key(source), FileFunction::Transform, kOwnTime, static_cast<int32_t>(platform::Now()), false});
-  }
-
-  // nullopt for a file that was given up by Abort before it had a name.
+  // On any thread. nullopt for a file that was given up by Abort before it had a name.
   std::optional<FileOutcome> Process(size_t i) {
     const BatchFile& file = files_[i];
     if (file.status != Status::Ok) return Failure(file, file.status, file.hint);
@@ -97,7 +54,7 @@ class TurnBatch {
     bool goesOn = true;
     if (names_.ConcernsNobodyElse(file.name, outcome.destination)) {
       goesOn = Settle(outcome);
-    } else if (!run_->InTurn(i, [&] { goesOn = Settle(outcome); })) {
+    } else if (!run_.InTurn(i, [&] { goesOn = Settle(outcome); })) {
       return std::nullopt;
     }
     if (goesOn && !function_.dryRun) Turn(outcome);
@@ -160,11 +117,9 @@ class TurnBatch {
   const std::span<const BatchFile> files_;
   const TurnFunction& function_;
   BatchJob& job_;
-  std::vector<std::unique_ptr<FileOutcome>> outcomes_;  // of files that are done and not yet reported
-  OrderedRun* run_ = nullptr;
-  std::atomic<bool> ended_{false};
   std::mutex mutex_;  // over what is given to names_
   RunNames names_;
+  ReportedRun run_;  // last: its threads use the rest
 };
 
 }  // namespace

@@ -75,6 +75,8 @@ struct BmpHeader {
   uint32_t colorsUsed = 0, colorsImportant = 0;
 
   bool IsOs2() const { return infoSize == kOs2InfoSize; }
+  // Whether other programs may find other colours in it: the writer's forms leave no doubt.
+  bool IsPeculiar() const { return (!IsOs2() && infoSize != kWindowsInfoSize) || bits == 16 || (bits > 8 && compression != 0); }
   bool TopDown() const { return height < 0; }
   // The number of rows, 0 when it is more than a height can say.
   int32_t Rows() const { return height == std::numeric_limits<int32_t>::min() ? 0 : std::abs(height); }
@@ -139,6 +141,7 @@ Status DescribePicture(const platform::FileView& file, const BmpHeader& header, 
   picture.width = header.width;
   picture.height = header.Rows();
   picture.bitsPerPixel = header.Depth();
+  picture.simplified = header.IsPeculiar();
   picture.imageBytes = EstimateImageBytes(picture.width, picture.height, picture.bitsPerPixel);
   picture.alphaFlags = static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (header.bits > 24 ? kHasAlpha : 0));
   ReadPalette(file.Bytes(), header, picture.palette);

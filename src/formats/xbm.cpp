@@ -229,6 +229,7 @@ Status DescribePicture(const platform::FileView& file, PictureRecord& picture) {
   picture.imageBytes = EstimateImageBytes(picture.width, picture.height, 1);
   picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
   MakeDefaultPalette(&picture.palette, &picture.bitsPerPixel, kBlackAndWhitePalette);
+  picture.simplified = picture.width % 8 != 0 || picture.height % 8 != 0;  // rows of other lengths mean another thing elsewhere
   return Status::Ok;
 }
 

@@ -87,7 +87,7 @@ struct PictureRecord {
   std::vector<uint8_t> comment;        // the file's comment text, UTF-8
   FixedText<80> warning;               // a fault in the file that the decoder passed over; empty when there was none
   int32_t pageCount = 1;               // pages or frames in the file
-  bool simplified = false;             // by `info`: the file holds more than the record can, deeper samples or further inks
+  bool simplified = false;             // by `info`: the file holds what a new one would not, deeper samples or further inks
   int32_t hotSpotX = 0, hotSpotY = 0;  // of a cursor, pixels from the left and the top
   int32_t page = 0;                    // the page that `read` is to decode, from 0
   int32_t thumbnailSide = 0;           // above 0: a decoder may deliver any smaller size that is still twice that of the largest

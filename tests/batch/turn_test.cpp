@@ -40,7 +40,7 @@ TEST(Turn, FilesChangeOnlyWhereNothingIsLost) {
       {"deep.png",
        Hex("89504E470D0A1A0A0000000D49484452000000010000000110000000006AEE47160000000B49444154789C6310320100005B004796FB1B"
            "650000000049454E44AE426082"),
-       "It holds finer colors than can be written again."},
+       "It holds more than would be written again."},
       {"e.gif",
        Hex("474946383961 0100 0100 800000 000000FFFFFF 2C00000000010001000002024401 00 2C00000000010001000002024C01 00 3B"),
        "It holds several pictures, of which only one would be left."},

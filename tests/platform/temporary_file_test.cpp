@@ -40,6 +40,29 @@ class TemporaryFileTest : public testing::Test {
   std::string before_;
 };
 
+TEST_F(TemporaryFileTest, KeepsWhatAFileWasUntilItIsReplaced) {
+  const std::string path = current_.Path("a.txt");
+  for (const std::string& folder : {current_.Path("new/undo"), std::string("/dev/shm/fmw-keep-test")}) {  // another volume
+    SCOPED_TRACE(folder);
+    const int64_t faults = test::ForEachFault([&] {
+      WriteText(path, "before");
+      TemporaryFile kept, other;
+      const bool done = kept.Keep(path, folder);
+      EXPECT_EQ(kept.Path().empty(), !done);
+      const bool replaced = WriteWholeFile(path, "after");
+      EXPECT_EQ(ReadText(path), replaced ? "after" : "before");
+      kept.Swap(other);
+      EXPECT_EQ(done ? ReadText(other.Path()) : "before", "before");
+    });
+    EXPECT_GT(faults, 2);
+    EXPECT_TRUE(fs::is_empty(folder));
+    fs::remove(folder);
+  }
+  TemporaryFile kept;
+  EXPECT_FALSE(kept.Keep(current_.Path("missing"), current_.Path()));
+  EXPECT_FALSE(kept.Keep(current_.Path(), current_.Path()));
+}
+
 TEST_F(TemporaryFileTest, HasAUniqueNameAndGoesWithItsOwner) {
   std::set<std::string> paths;
   {

@@ -57,11 +57,14 @@ TEST(Orient, UndoneByItsInverseAtEveryDepth) {
         const PicturePointer picture = MakePicture(width, height, [&](int32_t x, int32_t y) {
           return test::Scatter(x, y) % colors * (bits == 24 ? 1 : 0x010305) & 0xffffff;
         });
+        const PicturePointer deep = MakePicture(width, height, [&](int32_t x, int32_t y) { return test::ColorAt(*picture, x, y); });
         bool packed = false;
         ASSERT_EQ(PackFewColors(*picture, bits, packed), Status::Ok);
         test::AddAlpha(*picture, [](int32_t x, int32_t y) { return (x * 3 + y * 7) & 255; });
         const std::vector<uint32_t> before = Colors(*picture);
         ASSERT_EQ(OrientPicture(*picture, static_cast<Orientation>(orientation)), Status::Ok);
+        ASSERT_EQ(OrientPicture(*deep, static_cast<Orientation>(orientation)), Status::Ok);
+        EXPECT_EQ(Colors(*picture), Colors(*deep));
         EXPECT_EQ(picture->alpha.Width(), picture->image.Width());
         EXPECT_EQ(picture->width, picture->image.Width());
         ASSERT_EQ(OrientPicture(*picture, static_cast<Orientation>(kInverse[orientation])), Status::Ok);

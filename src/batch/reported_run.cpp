@@ -1,0 +1,60 @@
+#include "batch/reported_run.h"
+
+#include <new>
+#include <utility>
+
+#include "batch/abort.h"
+#include "core/settings.h"
+#include "platform/clock.h"
+#include "platform/folders.h"
+#include "platform/process.h"
+
+namespace fotomill {
+
+ReportedRun::ReportedRun(std::span<const BatchFile> files, BatchJob& job, Way way)
+    : files_(files),
+      job_(job),
+      way_(std::move(way)),
+      outcomes_(files.size()),
+      run_({.work = [this](size_t file) { Work(file); },
+            .deliver = [this](size_t file) { Deliver(file); },
+            .goesOn = [this] { return !ended_ && !AbortAsked(); },
+            .tick = [this] { Tick(); }}) {}
+
+uint32_t ReportedRun::CoreJobs() { return platform::CoreCount(); }
+
+void ReportedRun::Work(size_t file) {
+  std::optional<FileOutcome> outcome;
+  try {
+    outcome = way_.process(file);
+  } catch (const std::bad_alloc&) {
+    outcome = FileOutcome{.source = files_[file].name, .status = Status::MemoryAllocationError};
+  }
+  if (outcome) outcomes_[file] = std::make_unique<FileOutcome>(std::move(*outcome));
+}
+
+void ReportedRun::Deliver(size_t file) {
+  const std::unique_ptr<FileOutcome> outcome = std::move(outcomes_[file]);
+  if (outcome == nullptr) return;
+  job_.source.AssignCut(outcome->source);
+  const bool written = !outcome->destination.empty() && !outcome->skipped && !way_.dryRun;
+  if (written) NoteUse(outcome->source);
+  job_.filesChanged = job_.filesChanged || written;
+  if (outcome->skipped && outcome->status != Status::Ok) ++job_.writeAborts;
+  ReportOutcome(job_, *outcome, static_cast<uint32_t>(file), static_cast<uint32_t>(files_.size()));
+  if (job_.box != nullptr && !job_.box->GoesOn()) ended_ = true;
+}
+
+void ReportedRun::Tick() {
+  if (job_.box == nullptr) return;
+  job_.box->Tick();
+  if (!job_.box->GoesOn()) ended_ = true;
+}
+
+void ReportedRun::NoteUse(const std::string& source) {
+  if ((settings.FileHistoryFunctions >> static_cast<int32_t>(way_.history) & 1) == 0) return;
+  const auto now = static_cast<int32_t>(platform::Now());
+  job_.uses.push_back({platform::AbsolutePath(source), way_.history, kOwnTime, now, false});
+}
+
+}  // namespace fotomill

@@ -1,0 +1,51 @@
+#pragma once
+
+#include <atomic>
+#include <cstdint>
+#include <functional>
+#include <memory>
+#include <optional>
+#include <span>
+#include <string>
+#include <vector>
+
+#include "batch/job.h"
+#include "batch/ordered_run.h"
+#include "batch/run.h"
+
+namespace fotomill {
+
+// The way of every batch over files: each is worked on, on some thread, into an outcome; outcomes are reported on the calling
+// thread in the order of the selection, to the job's box, and what was written goes into the file history.
+class ReportedRun {
+ public:
+  struct Way {
+    // On any thread. nullopt for a file that was given up by Abort.
+    std::function<std::optional<FileOutcome>(size_t file)> process;
+    FileFunction history = FileFunction::Convert;
+    bool dryRun = false;
+  };
+
+  ReportedRun(std::span<const BatchFile> files, BatchJob& job, Way way);
+
+  // At most `jobs` files at a time; 0: one a core.
+  void Run(uint32_t jobs) { run_.Run(files_.size(), jobs == 0 ? CoreJobs() : jobs); }
+  // As OrderedRun::InTurn.
+  bool InTurn(size_t file, const std::function<void()>& step) { return run_.InTurn(file, step); }
+
+ private:
+  static uint32_t CoreJobs();
+  void Work(size_t file);
+  void Deliver(size_t file);
+  void Tick();
+  void NoteUse(const std::string& source);
+
+  const std::span<const BatchFile> files_;
+  BatchJob& job_;
+  const Way way_;
+  std::vector<std::unique_ptr<FileOutcome>> outcomes_;  // of files that are done and not yet reported; null: given up
+  std::atomic<bool> ended_{false};
+  OrderedRun run_;
+};
+
+}  // namespace fotomill
