@@ -6,6 +6,7 @@
 #include "batch/destination_name.h"
 #include "core/settings.h"
 #include "desktop/previous_file.h"
+#include "desktop/thumbnail.h"
 #include "platform/file_view.h"
 #include "platform/files.h"
 #include "platform/folders.h"
@@ -114,6 +115,7 @@ Outcome Exchange(const FileStep& step) {
   if (step.previous->HasChanged(step.from)) return "It has changed since and stays.";
   PreviousFile now;
   if (!now.Keep(step.from)) return "There is no room to keep it as it is now.";
+  DropThumbnails(step.from);
   Outcome outcome = CopyFile(step.previous->Path(), step.from, platform::Existing::Replace);
   if (!outcome.empty()) return outcome;
   step.previous->Swap(now);

@@ -6,6 +6,7 @@
 #include "core/data_folder.h"
 #include "core/settings.h"
 #include "core/whole_number.h"
+#include "desktop/thumbnail.h"
 #include "platform/clock.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
@@ -38,6 +39,7 @@ bool PreviousFiles::Keep(const std::string& path) {
   auto file = std::make_shared<PreviousFile>();
   if (!file->Keep(path)) return false;
   file->Replaced(path);
+  DropThumbnails(platform::AbsolutePath(path));
   const std::lock_guard lock(mutex_);
   return files_.emplace(platform::AbsolutePath(path), std::move(file)).second;
 }

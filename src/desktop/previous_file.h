@@ -32,7 +32,7 @@ class PreviousFile {
 // The previous files of one batch; from any thread.
 class PreviousFiles {
  public:
-  // To be called before a file is replaced. False: it should not be.
+  // To be called before a file is replaced; its thumbnails go. False: it should not be.
   [[nodiscard]] bool Keep(const std::string& path);
   // The deed of those that were replaced meanwhile, in the order of their paths; they are handed over.
   FileDeed Deed();

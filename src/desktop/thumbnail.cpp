@@ -54,6 +54,11 @@ class OpenDatabase {
     const std::lock_guard lock(mutex_);
     Write();
   }
+  void Drop(const std::string& path, const std::string& database) {
+    const std::lock_guard lock(mutex_);
+    Write();
+    if (platform::IsRegularFile(database) && Open(database, false)) (void)database_.Delete(path);
+  }
 
  private:
   static constexpr size_t kGathered = 64;
@@ -163,6 +168,14 @@ ThumbnailPointer LoadThumbnail(const ThumbnailWish& wish) {
 bool MayHoldThumbnail(int32_t format) { return format != kNoFormat && KeepsMetadata(FormatRow(format)); }
 
 void KeepThumbnailRecords() { openDatabase.Flush(); }
+
+void DropThumbnails(const std::string& path) {
+  const std::string file = ThumbnailPathFor(path);
+  ThumbnailRecord record;
+  if (!platform::FactsOf(file).link && ReadThumbnailFile(record, file)) (void)platform::DeleteFile(file);
+  openDatabase.Drop(path, ThumbnailDatabasePath({}));
+  openDatabase.Drop(path, ThumbnailDatabasePath(std::string(platform::SplitPath(path).folder)));
+}
 
 Status WriteThumbnail(const std::string& path) {
   ThumbnailRecord record;

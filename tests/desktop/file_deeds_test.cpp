@@ -2,12 +2,16 @@
 
 #include <gmock/gmock.h>
 
+#include "catalog/thumbnail_file.h"
 #include "core/data_folder.h"
 #include "desktop/favourites.h"
 #include "desktop/pasted_picture.h"
+#include "desktop/previous_file.h"
 #include "desktop/session.h"
 #include "desktop/tab_sets.h"
+#include "desktop/thumbnail.h"
 #include "picture/registry.h"
+#include "support/bitmaps.h"
 #include "support/files.h"
 #include "support/scoped_environment.h"
 
@@ -53,6 +57,32 @@ TEST_F(FileDeedsTest, EveryDeedCanBeTakenBackAndDoneAgain) {
     EXPECT_THAT(again.failures, IsEmpty());
     EXPECT_THAT(TakeBack(again.done).failures, IsEmpty());
   }
+}
+
+TEST_F(FileDeedsTest, TurnsGiveTheFileBackAndTheirThumbnailsGo) {
+  const std::string data = DataFolder();
+  SetDataFolder(folder_.Path("data"));
+  const std::string path = From("turned.bmp");
+  test::WriteBytes(path, test::BitmapFile(9, 5, 24));
+  const std::string old = ReadText(path);
+  ASSERT_EQ(WriteThumbnail(path), Status::Ok);
+  DeedResult result = TurnOneFile(path, Orientation::QuarterRight);
+  ASSERT_THAT(result.failures, IsEmpty());
+  EXPECT_EQ(DeedName(result.done), "rotation of turned.bmp");
+  EXPECT_FALSE(platform::FileExists(ThumbnailPathFor(path)));
+  const std::string turned = ReadText(path);
+  EXPECT_NE(turned, old);
+  for (int round = 0; round < 2; ++round) {
+    ASSERT_THAT(TakeBack(result.done).failures, IsEmpty());
+    EXPECT_EQ(ReadText(path), old);
+    ASSERT_THAT(CarryOut(result.done).failures, IsEmpty());
+    EXPECT_EQ(ReadText(path), turned);
+  }
+  WriteText(path, "somebody's work");
+  EXPECT_EQ(TakeBack(result.done).failures.size(), 1u);
+  EXPECT_EQ(ReadText(path), "somebody's work");
+  EXPECT_EQ(TurnOneFile(From("a.png"), Orientation::HalfTurn).failures.size(), 1u);  // no picture
+  SetDataFolder(data);
 }
 
 TEST_F(FileDeedsTest, NothingIsEverReplaced) {

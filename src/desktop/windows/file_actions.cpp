@@ -186,13 +186,14 @@ void FileActions::NewFolder(const std::string& parent) {
   frame_.FilesChanged();
 }
 
-bool FileActions::SaveTurned(const std::string& path, Orientation turn, std::function<void(bool done)> then) {
+bool FileActions::SaveTurned(const std::string& path, Orientation turn, Turned then) {
   if (busy_) return false;
   const auto work = [path, turn](const DeedProgress&) { return TurnOneFile(path, turn); };
   Run("Rotation of " + std::string(platform::FileNameOf(path)), work, [this, then = std::move(then)](DeedResult result) {
     const bool done = !result.done.steps.empty();
+    const std::string note = result.note;
     undo_.Add(std::move(result.done));
-    then(done);
+    then(done, note);
   });
   return true;
 }

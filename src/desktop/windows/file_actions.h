@@ -34,8 +34,9 @@ class FileActions : public wxEvtHandler {
   // Several files at once, as the caller has planned it.
   void RenameAll(std::vector<FileStep> steps);
   void NewFolder(const std::string& parent);
-  // Turns the picture in a file; `then` is told whether that was done. False when something else is being done.
-  bool SaveTurned(const std::string& path, Orientation turn, std::function<void(bool done)> then);
+  // Turns the picture in a file; `then` is told whether that was done, with a remark. False when something else is being done.
+  using Turned = std::function<void(bool done, const std::string& note)>;
+  bool SaveTurned(const std::string& path, Orientation turn, Turned then);
 
   void Undo();
   void Redo();

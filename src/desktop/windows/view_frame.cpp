@@ -96,11 +96,13 @@ void ViewFrame::StepPage(int pages) {
   if (page < 0 || page >= shown->picture->pageCount) return;
   page_ = page;
   turn_ = Orientation::Upright;
+  note_.clear();
   ShowPlace();
 }
 
 void ViewFrame::StartAfresh() {
   page_ = 0;
+  note_.clear();
   turn_ = Orientation::Upright;
   canvas_->StartAfresh();
   ShowPlace();
@@ -198,6 +200,7 @@ std::string ViewFrame::StatusLine() const {
   const PictureRecord& picture = *shown->picture;
   line += ", " + SizeAndZoom(picture, canvas_->Zoom());
   if (turn_ != Orientation::Upright) line += ", turned, not saved";
+  if (!note_.empty()) line += ". " + note_;
   if (picture.pageCount > 1) line += ", page " + std::to_string(page_ + 1) + " of " + std::to_string(picture.pageCount);
   return line;
 }
@@ -276,6 +279,7 @@ void ViewFrame::DeleteFile() {
 void ViewFrame::Turn(Orientation turn) {
   if (saving_ || !IsCurrent(loaded_) || loaded_->picture == nullptr) return wxBell();
   turn_ = Composed(turn_, turn);
+  note_.clear();
   LogEvent("view-turned", std::to_string(static_cast<int>(turn_)) + " " + list_[place_]);
   ShowTurned();
 }
@@ -284,10 +288,11 @@ void ViewFrame::SaveTurned() {
   if (saving_ || turn_ == Orientation::Upright) return SetStatusText("The picture is as its file has it.");
   const std::string path = list_[place_];
   const wxWeakRef<ViewFrame> self(this);
-  saving_ = frame_.Files().SaveTurned(path, turn_, [self](bool done) {
+  saving_ = frame_.Files().SaveTurned(path, turn_, [self](bool done, const std::string& note) {
     if (!self) return;
     self->saving_ = false;
     if (done) self->FilesChanged();
+    self->note_ = note;
   });
   SetStatusText(saving_ ? "Saving..." : "Wait until the files before are done.");
 }
@@ -327,7 +332,9 @@ void ViewFrame::OnKey(wxKeyEvent& event) {
   if (key == WXK_RIGHT || key == WXK_DOWN) return Step(1);
   if (event.AltDown() && key == WXK_RETURN) return ShowInfoWindow();
   if (event.AltDown()) return event.Skip();
-  const bool letter = key >= 'A' && key <= 'Z';
+  // Some letters with Ctrl have the numbers of other keys.
+  constexpr int kLettersWithCtrl[] = {'C', 'S', 'Y', 'Z'};
+  const bool letter = std::ranges::find(kLettersWithCtrl, key) != std::end(kLettersWithCtrl);
   const int typed = !event.ControlDown() ? key : letter ? key - 'A' + WXK_CONTROL_A : 0;
   if (const KeyCommand<ViewFrame>* command = CommandOfKey(ViewCommands(), typed)) return command->run(*this);
   event.Skip();

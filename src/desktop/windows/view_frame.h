@@ -67,6 +67,7 @@ class ViewFrame : public wxFrame {
   Orientation turn_ = Orientation::Upright;  // how the view is turned against the file
   ViewPicturePointer loaded_;                // as the file has it
   bool saving_ = false;
+  std::string note_;    // how the file was turned, where that is not as usual
   double keyTime_ = 0;  // when the picture that is awaited was asked for
   bool overlay_ = false;
   std::string painted_;  // what the log was told of
