@@ -47,7 +47,9 @@ bool ColumnIs(const RgbImage& image, int32_t x, const uint8_t* color) {
 RgbImage FilledImage(int32_t width, int32_t height, Color color) {
   RgbImage image;
   if (!Reserve(image, width, height)) return image;
-  for (size_t i = 0; i < image.bytes.size(); ++i) image.bytes[i] = static_cast<uint8_t>(color >> (8 * (i % 3)));
+  const size_t row = 3 * static_cast<size_t>(width);
+  for (size_t i = 0; i < std::min(row, image.bytes.size()); ++i) image.bytes[i] = static_cast<uint8_t>(color >> (8 * (i % 3)));
+  for (int32_t y = 1; y < height; ++y) std::memcpy(image.Row(y), image.Row(0), row);
   return image;
 }
 

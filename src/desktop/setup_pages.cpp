@@ -53,6 +53,8 @@ constexpr SetupItem kItems[] = {
     {Viewing,    "Picture",            ViewModeCheckerboard,           "Show transparency as a checkerboard"},
     {Viewing,    "Picture",            UseAlphaChannels,               "Read transparency of bitmaps (BMP)"},
     {Viewing,    "Picture",            RecognizeAPNG,                  "Recognize animated PNG files"},
+    {Viewing,    "Animations",         AnimationViewModeProgressBar,   "Show how far an animation is"},
+    {Viewing,    "Animations",         AnimationViewModeToolbar,       "Show buttons below an animation"},
     {Viewing,    "Window",             ViewModeBackground,             "Color behind the picture"},
     {Viewing,    "Window",             MaximizeViewWindow,             "Open view windows as large as the screen"},
     {Viewing,    "Window",             RightClickMenuInView,           "The right mouse button opens a menu"},

@@ -35,6 +35,24 @@ Status LoadInto(const ViewWish& wish, ViewPicture& view) {
   RETURN_IF_BAD(LoadPictureInfo(wish.path.c_str(), picture));
   picture->page = wish.page;
   RETURN_IF_BAD(ReadPicture(*picture));
+  return PrepareView(std::move(picture), view);
+}
+
+}  // namespace
+
+void SetScreenProfile(std::vector<uint8_t> profile) { screenProfile = std::move(profile); }
+
+ViewLook ViewLook::FromSettings() { return {settings.ViewModeColorProfiles != 0, settings.ViewModeCheckerboard != 0}; }
+
+uint64_t ViewPicture::Bytes() const {
+  const auto bytes = [](const PackedImage& image, const PackedImage& alpha) {
+    return image.Bytes().size() + alpha.Bytes().size();
+  };
+  return kRecordBytes + bytes(fitted.image, fitted.alpha) + (picture == nullptr ? 0 : bytes(picture->image, picture->alpha));
+}
+
+Status PrepareView(PicturePointer picture, ViewPicture& view) {
+  const ViewWish& wish = view.wish;
   // Before the background joins in, whose colour is the screen's.
   const bool profiles = !picture->metadata.icc.empty() || !screenProfile.empty();
   if (wish.look.profiles && profiles) ColourTransform(picture->metadata.icc, screenProfile).Apply(picture->image);
@@ -52,19 +70,6 @@ Status LoadInto(const ViewWish& wish, ViewPicture& view) {
   }
   view.picture = std::move(picture);
   return Status::Ok;
-}
-
-}  // namespace
-
-void SetScreenProfile(std::vector<uint8_t> profile) { screenProfile = std::move(profile); }
-
-ViewLook ViewLook::FromSettings() { return {settings.ViewModeColorProfiles != 0, settings.ViewModeCheckerboard != 0}; }
-
-uint64_t ViewPicture::Bytes() const {
-  const auto bytes = [](const PackedImage& image, const PackedImage& alpha) {
-    return image.Bytes().size() + alpha.Bytes().size();
-  };
-  return kRecordBytes + bytes(fitted.image, fitted.alpha) + (picture == nullptr ? 0 : bytes(picture->image, picture->alpha));
 }
 
 std::string SizeAndZoom(const PictureRecord& picture, double scale) {

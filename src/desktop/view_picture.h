@@ -66,6 +66,8 @@ std::string SizeAndZoom(const PictureRecord& picture, double scale);
 // A decoded picture's pixels for other programs: on a background, 0x00BBGGRR, and in sRGB whatever the screen's colours are.
 Status PixelsForOthers(const ViewPicture& view, Color background, RgbImage& pixels);
 
+// Makes a decoded picture what the wish of `view` asks for. Statuses of PrepareForDisplay.
+Status PrepareView(PicturePointer picture, ViewPicture& view);
 ViewPicturePointer LoadViewPicture(const ViewWish& wish);
 // A turned copy of a picture that was loaded; null where there is no memory for it.
 ViewPicturePointer TurnedView(const ViewPicture& view, Orientation turn);

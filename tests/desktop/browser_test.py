@@ -2,7 +2,7 @@
 """The browser and the view window of the real program, by keyboard."""
 import time
 
-from driven_desktop import Desktop, Failure, make_pictures, run
+from driven_desktop import Desktop, Failure, gif_of_frames, make_pictures, run
 
 NAMES = ["a1.bmp", "a2.png", "a10.jpg", "b.tif"]
 
@@ -179,4 +179,44 @@ def compare(folder):
         desktop.wait_end()
 
 
-run(open_select_view, compare)
+def play_animation(folder):
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["b.bmp"])
+    (pictures / "a.gif").write_bytes(gif_of_frames([30] * 5))
+    (folder / "data").mkdir()
+    (folder / "data/FMWSlideshow.txt").write_text("[Slideshow]\nSeconds=1\nRepeat=0\n")
+    with Desktop(folder, pictures / "a.gif") as desktop:
+        for frame in (1, 2, 3, 4, 5, 1):
+            desktop.wait(rf"view-frame frame {frame} of 5$")
+        desktop.focus("View", settle=False)
+        desktop.key("space")
+        paused = int(desktop.wait(r"view-frame frame . of 5, paused").split()[2])
+        desktop.screenshot("animation")
+        desktop.key("period")
+        desktop.wait(rf"view-frame frame {paused % 5 + 1} of 5, paused")
+        desktop.key("comma", "comma")
+        desktop.wait(rf"view-frame frame {(paused + 3) % 5 + 1} of 5, paused")
+        desktop.key("space")
+        desktop.wait(r"view-frame frame 1 of 5$")
+        # A slideshow waits until an animation that takes longer was shown once, and ends with the last picture.
+        desktop.key("Escape")
+        desktop.focus("Fotomill Professional")
+        desktop.key("Home", "Return")
+        desktop.wait(r"view-frame frame 1 of 5$")
+        desktop.focus("View", settle=False)
+        desktop.key("s")
+        desktop.wait(r"slideshow seconds=1 random=0 repeat=0")
+        desktop.wait(r"view-frame frame 5 of 5$")
+        desktop.wait(r"view place=2/2 ")
+        desktop.wait(r"slideshow ended")
+    # Where the system's animations are off, it waits to be asked.
+    (folder / "home/.config/gtk-3.0").mkdir(parents=True, exist_ok=True)
+    (folder / "home/.config/gtk-3.0/settings.ini").write_text("[Settings]\ngtk-enable-animations=0\n")
+    with Desktop(folder, pictures / "a.gif") as desktop:
+        desktop.wait(r"view-frame frame 1 of 5, paused")
+        desktop.focus("View")
+        desktop.key("space")
+        desktop.wait(r"view-frame frame 2 of 5$")
+
+
+run(open_select_view, compare, play_animation)

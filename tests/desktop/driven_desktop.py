@@ -200,6 +200,23 @@ def run(*tests):
     sys.exit(1 if failed else 0)
 
 
+def gif_of_frames(delays, size=(400, 300)):
+    """An animation of frames in one colour each, for ever; delays in hundredths of a second."""
+    def block(data):
+        return b"".join(bytes([len(data[i:i + 255])]) + data[i:i + 255] for i in range(0, len(data), 255)) + b"\0"
+
+    width, height = size
+    colours = bytes((40 * i * j) % 256 for i in range(1, 9) for j in (1, 2, 3))
+    gif = b"GIF89a" + struct.pack("<2H3B", width, height, 0xF2, 0, 0) + colours + b"!\xff\x0bNETSCAPE2.0\3\1\0\0\0"
+    for number, delay in enumerate(delays):
+        # A code of 4 bits a pixel, and a clear code often enough that codes stay that long.
+        codes = [code for i in range(width * height) for code in ([8, number % 8] if i % 6 == 0 else [number % 8])] + [9]
+        codes += [0] * (len(codes) % 2)
+        pixels = bytes(low | high << 4 for low, high in zip(codes[0::2], codes[1::2]))
+        gif += b"!\xf9\4\0" + struct.pack("<H", delay) + b"\0\0," + struct.pack("<4H", 0, 0, width, height) + b"\0\3" + block(pixels)
+    return gif + b";"
+
+
 def make_pictures(folder, names):
     """Small pictures of different colours, made from a sample by the command line."""
     folder.mkdir(exist_ok=True)

@@ -43,6 +43,8 @@ constexpr SymbolShape kSymbols[] = {
     {"history", "<circle cx='8' cy='8' r='6.2'/><path d='M8 4.2 V8 L10.8 9.6'/>"},
     {"previous", "<path d='M12 3 L5 8 L12 13 Z M3.5 3 V13'/>"},
     {"next", "<path d='M4 3 L11 8 L4 13 Z M12.5 3 V13'/>"},
+    {"play", "<path d='M4.5 2.5 L12.5 8 L4.5 13.5 Z' fill='COLOR'/>"},
+    {"pause", "<path d='M5 3 V13 M11 3 V13' stroke-width='2.6'/>"},
     {"fit", "<path d='M2 6 V2.5 H5.5 M10.5 2.5 H14 V6 M14 10 V13.5 H10.5 M5.5 13.5 H2 V10'/>"},
     {"actual",
      "<path d='M3 4.5 L4.5 3.5 V12.5 M11.5 4.5 L13 3.5 V12.5'/><circle cx='8.4' cy='6.2' r='0.6'/><circle cx='8.4' cy='10.2' "

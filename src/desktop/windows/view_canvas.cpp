@@ -8,8 +8,10 @@
 
 #include "core/choice_lists.h"
 #include "core/settings.h"
+#include "desktop/event_log.h"
 #include "desktop/windows/bitmaps.h"
 #include "desktop/windows/wx_text.h"
+#include "platform/clock.h"
 #include "platform/paths.h"
 #include "processing/scale.h"
 
@@ -52,6 +54,14 @@ void ViewCanvas::Show(ViewPicturePointer picture) {
   standIn_.Free();
   if (Showable()) transform_.SetPicture(picture_->picture->image.Width(), picture_->picture->image.Height());
   TransformChanged();
+}
+
+void ViewCanvas::ShowFrame(ViewPicturePointer frame, bool plays) {
+  if (!plays) return Show(std::move(frame));
+  picture_ = std::move(frame);
+  scaled_.reset();
+  transform_.SetPicture(picture_->picture->image.Width(), picture_->picture->image.Height());
+  Refresh();
 }
 
 void ViewCanvas::ShowStandIn(PackedImage image, int32_t width, int32_t height) {
@@ -151,7 +161,16 @@ ViewSource ViewCanvas::BestSource() const {
 
 // --- painting ---
 
+// Tells the log of paintings that took longer than a frame of the screen.
 void ViewCanvas::OnPaint(wxPaintEvent&) {
+  constexpr double kFrame = 1.0 / 60;
+  const double start = platform::MonotonicSeconds();
+  Paint();
+  const double seconds = platform::MonotonicSeconds() - start;
+  if (seconds > kFrame) LogEvent("slow-paint", std::to_string(std::lround(seconds * 1000)) + " ms");
+}
+
+void ViewCanvas::Paint() {
   wxPaintDC dc(this);
   if (DeviceSize().x < 1 || DeviceSize().y < 1) return;
   if (standIn_.Empty() && !Showable()) {

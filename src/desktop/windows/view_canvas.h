@@ -30,6 +30,10 @@ class ViewCanvas : public wxWindow {
 
   // What is shown from here on; of a picture that could not be loaded, why.
   void Show(ViewPicturePointer picture);
+  // Another frame of an animation, in the same place. While it plays it is drawn from what there is, quickly rather than well.
+  void ShowFrame(ViewPicturePointer frame, bool plays);
+  // Makes pixels for the zoom of the frame at which the animation was paused.
+  void Sharpen() { TransformChanged(); }
   // An image that stands in for a picture of `width` by `height` until that comes.
   void ShowStandIn(PackedImage image, int32_t width, int32_t height);
   const ViewPicturePointer& Picture() const { return picture_; }
@@ -63,6 +67,7 @@ class ViewCanvas : public wxWindow {
   void OnMotion(wxMouseEvent& event);
   void OnDoubleClick(wxMouseEvent& event);
   void OnPaint(wxPaintEvent&);
+  void Paint();
   void PaintPicture(wxDC& dc);
   void PaintMessage(wxDC& dc) const;
   void PaintOverlay(wxDC& dc) const;

@@ -16,6 +16,10 @@ template <int step>
 void StepPage(ViewFrame& view) {
   view.StepPage(step);
 }
+template <int step>
+void StepFrame(ViewFrame& view) {
+  view.StepFrame(step);
+}
 template <ZoomMode mode>
 void Zoom(ViewFrame& view) {
   view.Canvas().SetZoom(mode);
@@ -41,7 +45,7 @@ void Last(ViewFrame& view) { view.GoTo(view.LastPlace()); }
 
 // clang-format off
 constexpr KeyCommand<ViewFrame> kCommands[] = {
-    {"&Next",             "Space",     {WXK_SPACE, WXK_PAGEDOWN, 'N'},  Step<1>},
+    {"&Next",             "Page Down", {WXK_PAGEDOWN, 'N'},             Step<1>},
     {"&Previous",         "Backspace", {WXK_BACK, WXK_PAGEUP, 'P'},     Step<-1>},
     {"&First",            "Home",      {WXK_HOME},                      First},
     {"&Last",             "End",       {WXK_END},                       Last},
@@ -54,11 +58,15 @@ constexpr KeyCommand<ViewFrame> kCommands[] = {
     {"Fi&ll the window",  "3",         {'3', WXK_NUMPAD3},              Zoom<ZoomMode::Fill>},
     {"&Keep zoom and place between pictures", "K", {'K'},               Switch<&Settings::ViewModeKeepZoom>, IsOn<&Settings::ViewModeKeepZoom>},
     {nullptr, nullptr, {}, nullptr},
+    {"Play, pause or ne&xt", "Space",  {WXK_SPACE},                     Of<&ViewFrame::PlayOrNext>},
+    {"Next frame",        ".",         {'.'},                           StepFrame<1>},
+    {"Previous frame",    ",",         {','},                           StepFrame<-1>},
     {"Next pa&ge",        "]",         {']'},                           StepPage<1>},
     {"Pre&vious page",    "[",         {'['},                           StepPage<-1>},
     {nullptr, nullptr, {}, nullptr},
     {"Full &screen",      "F11",       {WXK_F11, 'F'},                  Of<&ViewFrame::ToggleFullScreen>},
     {"Slides&how",        "S",         {'S', WXK_F8},                   Of<&ViewFrame::ToggleSlideshow>},
+    {"Slidesho&w...",     "Shift+S",   {},                              Of<&ViewFrame::ChooseSlideshow>},
     {"In&formation",      "I",         {'I'},                           Of<&ViewFrame::ToggleOverlay>},
     {"Colors of the pro&file", "M",    {'M'},                           Switch<&Settings::ViewModeColorProfiles>, IsOn<&Settings::ViewModeColorProfiles>},
     {"Check&erboard behind transparency", "B", {'B'},                   Switch<&Settings::ViewModeCheckerboard>, IsOn<&Settings::ViewModeCheckerboard>},

@@ -28,7 +28,6 @@ namespace fotomill::desktop {
 namespace {
 
 constexpr uint64_t kAheadBytes = 768ull * 1024 * 1024;  // of decoded pictures
-constexpr int kSlideMs = 4000;
 constexpr int kPointerMs = 2000;
 
 }  // namespace
@@ -37,8 +36,8 @@ ViewFrame::ViewFrame(MainFrame& frame, const std::vector<std::string>& list, con
     : wxFrame(&frame, wxID_ANY, "View", wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE, "FotomillProfessionalView"),
       frame_(frame),
       list_(list),
-      slideTimer_(this),
-      pointerTimer_(this) {
+      pointerTimer_(this),
+      slideshow_({.busy = [this] { return animation_->MustFinish(); }, .show = [this](size_t place) { GoTo(place); }}) {
   place_ = static_cast<size_t>(std::find(list_.begin(), list_.end(), file) - list_.begin());
   if (place_ == list_.size()) {
     list_ = {file};
@@ -47,7 +46,17 @@ ViewFrame::ViewFrame(MainFrame& frame, const std::vector<std::string>& list, con
   SetSize(frame.GetSize());
   loader_ = std::make_unique<ViewLoader>(kAheadBytes, [this] { CallAfter([this] { PictureCame(); }); });
   canvas_ = new ViewCanvas(
-      this, {.resized = [this] { WantPictures(); }, .changed = [this] { ViewChanged(); }, .painted = [this] { LogPaint(); }});
+      this, {.resized = [this] { Resized(); }, .changed = [this] { ViewChanged(); }, .painted = [this] { LogPaint(); }});
+  bar_ = new AnimationBar(this, {.toggle = [this] { PlayOrNext(), canvas_->SetFocus(); },
+                                 .step = [this](int frames) { StepFrame(frames), canvas_->SetFocus(); }});
+  animation_ = std::make_unique<ViewAnimation>(
+      *canvas_, *bar_,
+      ViewAnimation::Events{.changed = [this] { ViewChanged(); },
+                            .dressed = [this](const ViewPicturePointer& frame) { return Turned(frame); }});
+  auto* column = new wxBoxSizer(wxVERTICAL);
+  column->Add(canvas_, wxSizerFlags(1).Expand());
+  column->Add(bar_, wxSizerFlags().Expand());
+  SetSizer(column);
   CreateStatusBar();
   canvas_->SetFocus();
   canvas_->Bind(wxEVT_KEY_DOWN, &ViewFrame::OnKey, this);
@@ -56,8 +65,6 @@ ViewFrame::ViewFrame(MainFrame& frame, const std::vector<std::string>& list, con
     HidePointerLater();
     event.Skip();
   });
-  Bind(
-      wxEVT_TIMER, [this](wxTimerEvent&) { Step(1); }, slideTimer_.GetId());
   Bind(
       wxEVT_TIMER,
       [this](wxTimerEvent&) {
@@ -68,7 +75,11 @@ ViewFrame::ViewFrame(MainFrame& frame, const std::vector<std::string>& list, con
   ShowPlace();
 }
 
-ViewFrame::~ViewFrame() { loader_.reset(); }  // its thread calls back into this window
+ViewFrame::~ViewFrame() {
+  // Their threads call back into this window.
+  animation_.reset();
+  loader_.reset();
+}
 
 // --- which picture ---
 
@@ -90,6 +101,7 @@ void ViewFrame::GoTo(size_t place) {
 }
 
 void ViewFrame::StepPage(int pages) {
+  if (animation_->Active()) return animation_->Step(pages);
   const ViewPicturePointer& shown = canvas_->Picture();
   if (shown == nullptr || shown->picture == nullptr) return;
   const int32_t page = page_ + pages;
@@ -108,6 +120,15 @@ void ViewFrame::StartAfresh() {
   ShowPlace();
 }
 
+void ViewFrame::StepFrame(int frames) {
+  if (animation_->Active()) animation_->Step(frames);
+}
+
+void ViewFrame::PlayOrNext() {
+  if (!animation_->Active()) return Step(1);
+  animation_->Toggle();
+}
+
 void ViewFrame::ShowPlace() {
   if (AskForPicture()) return;
   ShowStandIn();
@@ -116,6 +137,7 @@ void ViewFrame::ShowPlace() {
 
 // Whether the picture was there already, and is shown.
 bool ViewFrame::AskForPicture() {
+  animation_->End();
   keyTime_ = platform::MonotonicSeconds();
   WantPictures();
   ViewPicturePointer ready = loader_->Find(WishOf(place_));
@@ -141,16 +163,20 @@ void ViewFrame::ShowStandIn() {
   canvas_->ShowStandIn(std::move(image), width, height);
 }
 
-// The picture itself, then two each way.
+// The picture itself, then what the slideshow goes to, then two each way.
 void ViewFrame::WantPictures() {
   if (loader_ == nullptr || canvas_ == nullptr) return;
   std::vector<ViewWish> wishes;
-  const int64_t count = static_cast<int64_t>(list_.size());
-  for (const int64_t step : {0, 1, -1, 2, -2}) {
-    const size_t place = static_cast<size_t>(((static_cast<int64_t>(place_) + step) % count + count) % count);
+  const auto want = [&](size_t place) {
     ViewWish wish = WishOf(place);
     const auto same = [&](const ViewWish& other) { return other.SamePicture(wish); };
     if (std::none_of(wishes.begin(), wishes.end(), same)) wishes.push_back(std::move(wish));
+  };
+  want(place_);
+  if (const auto upcoming = slideshow_.Upcoming(); upcoming && *upcoming < list_.size()) want(*upcoming);
+  const int64_t count = static_cast<int64_t>(list_.size());
+  for (const int64_t step : {1, -1, 2, -2}) {
+    want(static_cast<size_t>(((static_cast<int64_t>(place_) + step) % count + count) % count));
   }
   loader_->Want(std::move(wishes));
 }
@@ -168,14 +194,27 @@ void ViewFrame::TakePicture(ViewPicturePointer picture) {
   if (picture->picture != nullptr) frame_.NoteUses({FileUse{list_[place_], FileFunction::View}});
   loaded_ = std::move(picture);
   ShowTurned();
-  if (slideTimer_.IsRunning()) slideTimer_.Start(kSlideMs);
+  animation_->Begin(loaded_);
+  slideshow_.ShownAt(place_, list_.size());
+}
+
+void ViewFrame::Resized() {
+  if (animation_ == nullptr) return;  // still being made
+  WantPictures();
+  animation_->Resized();
 }
 
 void ViewFrame::ShowTurned() {
-  const bool turns = turn_ != Orientation::Upright && loaded_->picture != nullptr;
-  ViewPicturePointer turned = turns ? TurnedView(*loaded_, turn_) : loaded_;
+  if (animation_->Active()) return animation_->ShowAgain();
+  ViewPicturePointer turned = Turned(loaded_);
   if (turned == nullptr) return wxBell();
   canvas_->Show(std::move(turned));
+}
+
+// A picture, or a frame of it, as it is to be shown; null where there is no memory for that.
+ViewPicturePointer ViewFrame::Turned(const ViewPicturePointer& picture) const {
+  const bool turns = turn_ != Orientation::Upright && picture->picture != nullptr;
+  return turns ? TurnedView(*picture, turn_) : picture;
 }
 
 bool ViewFrame::IsCurrent(const ViewPicturePointer& picture) const {
@@ -184,8 +223,9 @@ bool ViewFrame::IsCurrent(const ViewPicturePointer& picture) const {
 
 // --- showing ---
 
-// Each picture and zoom once, with the time since the picture was asked for.
+// Each picture and zoom once, with the time since the picture was asked for; each frame of an animation.
 void ViewFrame::LogPaint() {
+  if (animation_->Active()) LogEvent("view-frame", animation_->StatusText());
   const std::string shown = std::to_string(std::lround(canvas_->Zoom() * 100)) + "% " + canvas_->Picture()->wish.path;
   if (shown == painted_) return;
   painted_ = shown;
@@ -200,8 +240,12 @@ std::string ViewFrame::StatusLine() const {
   const PictureRecord& picture = *shown->picture;
   line += ", " + SizeAndZoom(picture, canvas_->Zoom());
   if (turn_ != Orientation::Upright) line += ", turned, not saved";
+  if (animation_->Active()) {
+    line += ", " + animation_->StatusText();
+  } else if (picture.pageCount > 1) {
+    line += ", page " + std::to_string(page_ + 1) + " of " + std::to_string(picture.pageCount);
+  }
   if (!note_.empty()) line += ". " + note_;
-  if (picture.pageCount > 1) line += ", page " + std::to_string(page_ + 1) + " of " + std::to_string(picture.pageCount);
   return line;
 }
 
@@ -217,14 +261,17 @@ void ViewFrame::ViewChanged() {
   if (canvas_ == nullptr || GetStatusBar() == nullptr) return;  // still being made
   const std::string line = StatusLine();
   const wxString name = Shown(platform::FileNameOf(list_[place_]));
-  SetTitle(name + (turn_ == Orientation::Upright ? "" : " (turned, not saved)") + " - View");
+  const wxString title = name + (turn_ == Orientation::Upright ? "" : " (turned, not saved)") + " - View";
+  if (title != GetTitle()) SetTitle(title);
   SetStatusText(Shown(line));
-  TellScreenReader(*canvas_, name, Shown(line));
+  // A number that changes many times a second is nothing to listen to.
+  if (!animation_->Playing()) TellScreenReader(*canvas_, name, Shown(line));
   canvas_->SetOverlay(overlay_ ? OverlayLines() : std::vector<std::string>());
 }
 
 void ViewFrame::ToggleFullScreen() {
   ShowFullScreen(!IsFullScreen());
+  animation_->HideBar(IsFullScreen());
   HidePointerLater();
 }
 
@@ -234,9 +281,15 @@ void ViewFrame::HidePointerLater() {
 }
 
 void ViewFrame::ToggleSlideshow() {
-  if (slideTimer_.IsRunning()) return slideTimer_.Stop();
+  if (slideshow_.Running()) return slideshow_.Stop();
   if (!IsFullScreen()) ToggleFullScreen();
-  slideTimer_.Start(kSlideMs);
+  slideshow_.Start(place_, list_.size());
+  slideshow_.ShownAt(place_, list_.size());
+}
+
+void ViewFrame::ChooseSlideshow() {
+  slideshow_.Stop();
+  if (slideshow_.Choose(*this)) ToggleSlideshow();
 }
 
 void ViewFrame::ShowInfoWindow() { (new InfoFrame(frame_, this, {list_[place_]}))->Show(); }
@@ -255,7 +308,7 @@ void ViewFrame::SettingSwitched() {
 }
 
 void ViewFrame::Leave() {
-  slideTimer_.Stop();
+  slideshow_.Stop();
   if (IsFullScreen()) return ToggleFullScreen();
   if (BrowserPage* browser = frame_.Browser()) browser->FocusName(std::string(platform::FileNameOf(list_[place_])));
   Close();
@@ -330,6 +383,7 @@ void ViewFrame::OnKey(wxKeyEvent& event) {
   if (canvas_->PanByKey(key)) return;
   if (key == WXK_LEFT || key == WXK_UP) return Step(-1);
   if (key == WXK_RIGHT || key == WXK_DOWN) return Step(1);
+  if (event.ShiftDown() && key == 'S') return ChooseSlideshow();
   if (event.AltDown() && key == WXK_RETURN) return ShowInfoWindow();
   if (event.AltDown()) return event.Skip();
   // Some letters with Ctrl have the numbers of other keys.

@@ -8,7 +8,9 @@
 #include <vector>
 
 #include "desktop/view_picture.h"
+#include "desktop/windows/view_animation.h"
 #include "desktop/windows/view_canvas.h"
+#include "desktop/windows/view_slideshow.h"
 
 namespace fotomill::desktop {
 
@@ -23,9 +25,12 @@ class ViewFrame : public wxFrame {
   // Commands, by keys and menu.
   void Step(int files);
   void GoTo(size_t place);
-  void StepPage(int pages);
+  void StepPage(int pages);  // or frames of an animation
+  void StepFrame(int frames);
+  void PlayOrNext();  // plays or pauses an animation; without one, the next picture
   void ToggleFullScreen();
   void ToggleSlideshow();
+  void ChooseSlideshow();
   void ToggleOverlay();
   void SettingSwitched();  // one that says how pictures look or stay
   void Leave();            // full screen first, then the window
@@ -46,6 +51,7 @@ class ViewFrame : public wxFrame {
   bool AskForPicture();
   void ShowStandIn();
   void WantPictures();
+  void Resized();
   void PictureCame();
   void TakePicture(ViewPicturePointer picture);
   void ViewChanged();
@@ -59,6 +65,7 @@ class ViewFrame : public wxFrame {
   void LogPaint();
   void StartAfresh();
   void ShowTurned();
+  ViewPicturePointer Turned(const ViewPicturePointer& picture) const;
 
   MainFrame& frame_;
   std::vector<std::string> list_;
@@ -71,9 +78,11 @@ class ViewFrame : public wxFrame {
   double keyTime_ = 0;  // when the picture that is awaited was asked for
   bool overlay_ = false;
   std::string painted_;  // what the log was told of
-  wxTimer slideTimer_;
   wxTimer pointerTimer_;
   ViewCanvas* canvas_ = nullptr;
+  AnimationBar* bar_ = nullptr;
+  std::unique_ptr<ViewAnimation> animation_;
+  ViewSlideshow slideshow_;
   std::unique_ptr<ViewLoader> loader_;
 };
 

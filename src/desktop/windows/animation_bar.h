@@ -1,0 +1,36 @@
+#pragma once
+
+#include <wx/bmpbuttn.h>
+#include <wx/gauge.h>
+#include <wx/panel.h>
+
+#include <functional>
+
+namespace fotomill::desktop {
+
+// What stands below an animation: a line that tells how far it is, with AnimationViewModeProgressBar, and buttons, with
+// AnimationViewModeToolbar. Hidden until there is something to tell.
+class AnimationBar : public wxPanel {
+ public:
+  struct Events {
+    std::function<void()> toggle;  // play or pause
+    std::function<void(int frames)> step;
+  };
+
+  AnimationBar(wxWindow* parent, Events events);
+
+  // Shows what the settings want of it, if anything.
+  void Open();
+  void Close() { Show(false); }
+  void Tell(bool playing, size_t frame, size_t count);
+
+ private:
+  wxBitmapButton* AddButton(wxSizer& row, const char* symbol, const wxString& name, std::function<void()> action);
+
+  wxGauge* line_ = nullptr;
+  wxPanel* buttons_ = nullptr;
+  wxBitmapButton* toggle_ = nullptr;
+  bool playing_ = false;
+};
+
+}  // namespace fotomill::desktop
