@@ -137,13 +137,27 @@ bool TakeEmbedded(const ThumbnailWish& wish, Thumbnail& thumbnail) {
   return PixelsOfPicture(*picture, wish.side, thumbnail.pixels) == Status::Ok && source.Intact();
 }
 
+void TakeFacts(const PictureRecord& picture, Thumbnail& thumbnail) {
+  thumbnail.width = picture.width;
+  thumbnail.height = picture.height;
+  thumbnail.bits = picture.bitsPerPixel;
+  thumbnail.pages = picture.pageCount;
+  thumbnail.alpha = (picture.alphaFlags & kHasAlpha) != 0;
+  thumbnail.animated = picture.pageCount > 1 && (FormatRow(picture.formatIndex).flags & FMT_ANIMATED) != 0;
+}
+
+// What a record does not know of files that may have several pages: it is quickly told by their heads.
+void TellPages(const std::string& path, Thumbnail& thumbnail) {
+  const int32_t format = FindFormatByName(path);
+  PicturePointer picture;
+  if (format == kNoFormat || format == kSpareRow || (FormatRow(format).flags & FMT_MULTI) == 0) return;
+  if (LoadPictureInfo(path.c_str(), picture) == Status::Ok) TakeFacts(*picture, thumbnail);
+}
+
 Status MakeFromPicture(const ThumbnailWish& wish, Thumbnail& thumbnail) {
   PicturePointer picture;
   RETURN_IF_BAD(LoadPictureInfo(wish.path.c_str(), picture));
-  thumbnail.width = picture->width;
-  thumbnail.height = picture->height;
-  thumbnail.bits = picture->bitsPerPixel;
-  thumbnail.pages = picture->pageCount;
+  TakeFacts(*picture, thumbnail);
   picture->thumbnailSide = wish.side;
   RETURN_IF_BAD(ReadPicture(*picture));
   thumbnail.alpha = !picture->alpha.Empty();
@@ -158,7 +172,10 @@ Status MakeFromPicture(const ThumbnailWish& wish, Thumbnail& thumbnail) {
 
 ThumbnailPointer LoadThumbnail(const ThumbnailWish& wish) {
   auto thumbnail = std::make_shared<Thumbnail>();
-  if (TakeReady(wish, *thumbnail)) return thumbnail;
+  if (TakeReady(wish, *thumbnail)) {
+    TellPages(wish.path, *thumbnail);
+    return thumbnail;
+  }
   if (wish.standIn) return TakeEmbedded(wish, *thumbnail) ? thumbnail : nullptr;
   thumbnail->status = MakeFromPicture(wish, *thumbnail);
   if (thumbnail->status != Status::Ok) thumbnail->pixels = {};

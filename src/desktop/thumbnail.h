@@ -26,7 +26,8 @@ struct Thumbnail {
   RgbImage pixels;                                     // never larger than the square, nor enlarged
   int32_t width = 0, height = 0, bits = 0, pages = 1;  // of the picture, 0 when it was not opened
   bool alpha = false;
-  bool standIn = false;  // the thumbnail that the file itself holds, which nobody has compared with the picture
+  bool animated = false;  // the pages are frames that follow each other
+  bool standIn = false;   // the thumbnail that the file itself holds, which nobody has compared with the picture
 
   uint64_t Bytes() const { return sizeof *this + pixels.bytes.size(); }
 };

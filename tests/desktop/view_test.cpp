@@ -211,6 +211,14 @@ TEST(Thumbnail, DatabaseModesKeepWhatTheyMade) {
     KeepThumbnailRecords();
     EXPECT_EQ(std::filesystem::file_size(folder.Path("Fotomill.tdb")), 60u + 28442u);
   }
+  wish.path = folder.Path("a.webp");
+  std::filesystem::copy_file(test::SourcePath("tests/formats/webp/good/frames.webp"), wish.path);
+  for (int time = 0; time < 2; ++time) {
+    const ThumbnailPointer thumbnail = LoadThumbnail(wish);
+    EXPECT_EQ(thumbnail->pages, 3);
+    EXPECT_TRUE(thumbnail->animated && thumbnail->alpha);
+    KeepThumbnailRecords();
+  }
   wish = {folder.Path("none.bmp"), 1, 1, 96, choice::kLocalDatabase};
   EXPECT_EQ(LoadThumbnail(wish)->status, Status::FileOpenError);
 }

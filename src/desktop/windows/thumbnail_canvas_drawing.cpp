@@ -8,6 +8,7 @@
 #include "core/text.h"
 #include "desktop/event_log.h"
 #include "desktop/windows/bitmaps.h"
+#include "desktop/windows/thumbnail_badges.h"
 #include "desktop/windows/thumbnail_canvas.h"
 #include "desktop/windows/wx_text.h"
 #include "platform/clock.h"
@@ -137,16 +138,7 @@ void ThumbnailCanvas::DrawPicture(wxDC& dc, size_t line, const wxRect& square, c
   dc.SetPen(wxPen(looks.frame));
   dc.SetBrush(*wxTRANSPARENT_BRUSH);
   dc.DrawRectangle(wxRect(corner, shown).Inflate(1));
-  if (thumbnail->pages > 1) {
-    const wxString pages = wxString::Format("%d", thumbnail->pages);
-    const wxSize extent = dc.GetTextExtent(pages) + FromDIP(wxSize(8, 2));
-    const wxRect badge(wxPoint(corner.x + shown.x - extent.x, corner.y + shown.y - extent.y), extent);
-    dc.SetPen(*wxTRANSPARENT_PEN);
-    dc.SetBrush(wxBrush(looks.highlight));
-    dc.DrawRoundedRectangle(badge, FromDIP(3));
-    dc.SetTextForeground(looks.highlightText);
-    dc.DrawLabel(pages, badge, wxALIGN_CENTER);
-  }
+  DrawBadges(dc, *this, wxRect(corner, shown), *thumbnail, looks.highlight, looks.highlightText);
 }
 
 // A folder, or a sheet with the file's extension: what there is before, or instead of, a thumbnail.

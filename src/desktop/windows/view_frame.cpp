@@ -52,7 +52,7 @@ ViewFrame::ViewFrame(MainFrame& frame, const std::vector<std::string>& list, con
   animation_ = std::make_unique<ViewAnimation>(
       *canvas_, *bar_,
       ViewAnimation::Events{.changed = [this] { ViewChanged(); },
-                            .dressed = [this](const ViewPicturePointer& frame) { return Turned(frame); }});
+                            .dressed = [this](const ViewPicturePointer& picture) { return Turned(picture); }});
   auto* column = new wxBoxSizer(wxVERTICAL);
   column->Add(canvas_, wxSizerFlags(1).Expand());
   column->Add(bar_, wxSizerFlags().Expand());
