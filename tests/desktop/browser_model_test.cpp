@@ -1,4 +1,5 @@
 #include "desktop/browser_model.h"
+#include "desktop/palette.h"
 
 #include <gtest/gtest.h>
 
@@ -167,6 +168,32 @@ TEST(BrowserModel, TypingFinds) {
   model.SelectMatching("", MatchMode::Only);
   EXPECT_EQ(model.CountText(), "4 files, 600 bytes");
   EXPECT_EQ(model.FocusText(), "ab.png, 1 of 4");
+}
+
+// The system's colours: background, text, highlight and its text.
+TEST(Palette, EveryTextIsReadable) {
+  const Shade systems[][4] = {
+      {{255, 255, 255}, {0, 0, 0}, {0x35, 0x84, 0xe4}, {255, 255, 255}},           // light
+      {{0x2d, 0x2d, 0x2d}, {255, 255, 255}, {0x15, 0x53, 0x9e}, {255, 255, 255}},  // dark
+      {{0, 0, 0}, {255, 255, 255}, {255, 255, 255}, {0, 0, 0}},                    // much contrast
+      {{0x80, 0x80, 0x80}, {0x90, 0x90, 0x90}, {0x70, 0x70, 0x70}, {0x88, 0x88, 0x88}},
+      {{0xfd, 0xf6, 0xe3}, {0x65, 0x7b, 0x83}, {0xee, 0xe8, 0xd5}, {0x58, 0x6e, 0x75}},
+  };
+  EXPECT_NEAR(Contrast({0, 0, 0}, {255, 255, 255}), 21, 1e-9);
+  for (const auto& [background, text, highlight, highlightText] : systems) {
+    const ListPalette p = PaletteOf(background, text, highlight, highlightText);
+    for (const auto& [ink, ground] : {std::pair(p.text, p.background),
+                                      {p.selectedText, p.selected},
+                                      {p.restingText, p.resting},
+                                      {p.note, p.background},
+                                      {p.note, p.faint},
+                                      {p.fault, p.background},
+                                      {p.fault, p.faint}}) {
+      EXPECT_GE(Contrast(ink, ground), kReadable) << int(ink.red) << " on " << int(ground.red);
+    }
+  }
+  EXPECT_EQ(PaletteOf(systems[1][0], systems[1][1], systems[1][2], systems[1][3]).selected,
+            systems[1][2]);  // kept where it can be
 }
 
 TEST(Selection, MouseAndKeyboard) {

@@ -68,7 +68,6 @@ DestinationDialog::DestinationDialog(wxWindow* parent, const wxString& verb, con
   for (wxCheckBox* box : {reduce_, orient_, metadata_}) sizer->Add(box, below);
 
   preview_ = new wxStaticText(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxST_NO_AUTORESIZE | wxST_ELLIPSIZE_MIDDLE);
-  preview_->SetForegroundColour(wxSystemSettings::GetColour(wxSYS_COLOUR_GRAYTEXT));
   sizer->Add(preview_, below);
 
   auto* buttons = new wxBoxSizer(wxHORIZONTAL);

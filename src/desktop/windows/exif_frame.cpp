@@ -13,6 +13,7 @@
 #include "desktop/event_log.h"
 #include "desktop/windows/bitmaps.h"
 #include "desktop/windows/button_row.h"
+#include "desktop/windows/looks.h"
 #include "desktop/windows/text_actions.h"
 #include "desktop/windows/wx_text.h"
 #include "platform/files.h"
@@ -29,8 +30,8 @@ ExifFrame::ExifFrame(wxWindow* parent, const std::string& path)
   problem_ = new wxStaticText(panel, wxID_ANY, "Reading...");
   list_ = new wxDataViewListCtrl(panel, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxDV_SINGLE | wxDV_ROW_LINES);
   list_->SetName("EXIF values");
-  list_->AppendTextColumn("Name", wxDATAVIEW_CELL_INERT, FromDIP(270));
-  list_->AppendTextColumn("Value", wxDATAVIEW_CELL_INERT, FromDIP(330));
+  list_->AppendTextColumn("Name", wxDATAVIEW_CELL_INERT, TextWidth(*this, 270));
+  list_->AppendTextColumn("Value", wxDATAVIEW_CELL_INERT, TextWidth(*this, 330));
   thumbnail_ = new wxStaticBitmap(panel, wxID_ANY, wxBitmapBundle());
   thumbnailFacts_ = new wxStaticText(panel, wxID_ANY, wxEmptyString);
 

@@ -42,9 +42,11 @@ FolderTree::FolderTree(wxWindow* parent, const Favourites& favourites, Events ev
                  wxDefaultValidator, "Folders"),
       favourites_(favourites),
       events_(std::move(events)) {
-  wxVector<wxBitmapBundle> images;
-  for (const char* symbol : {"folder", "home", "favourite", "volume"}) images.push_back(Symbol(symbol));
-  SetImages(images);
+  TakeImages();
+  Bind(wxEVT_SYS_COLOUR_CHANGED, [this](wxSysColourChangedEvent& event) {
+    TakeImages();
+    event.Skip();
+  });
   AddRoot("");
   UpdatePlaces();
   // What is not read yet opens when it has been.
@@ -61,6 +63,13 @@ FolderTree::FolderTree(wxWindow* parent, const Favourites& favourites, Events ev
     events_.chosen(folder);
   });
   Bind(wxEVT_TREE_ITEM_MENU, [this](wxTreeEvent& event) { ShowMenu(event.GetItem(), event.GetPoint()); });
+}
+
+// In the colour of texts.
+void FolderTree::TakeImages() {
+  wxVector<wxBitmapBundle> images;
+  for (const char* symbol : {"folder", "home", "favourite", "volume"}) images.push_back(Symbol(symbol));
+  SetImages(images);
 }
 
 // --- places at the top ---

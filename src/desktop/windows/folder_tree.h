@@ -38,6 +38,7 @@ class FolderTree : public wxTreeCtrl {
   std::string FolderAt(const wxPoint& point) const;
 
  private:
+  void TakeImages();
   struct Place;
   std::vector<Place> Places() const;
   std::vector<wxTreeItemId> ChildrenOf(const wxTreeItemId& item) const;

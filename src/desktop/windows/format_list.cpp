@@ -3,6 +3,7 @@
 #include <wx/msgdlg.h>
 
 #include "desktop/event_log.h"
+#include "desktop/windows/looks.h"
 #include "desktop/windows/wx_text.h"
 #include "picture/format_switches.h"
 #include "picture/registry.h"
@@ -26,8 +27,8 @@ FormatList::FormatList(wxWindow* parent)
     : wxDataViewListCtrl(parent, wxID_ANY, wxDefaultPosition, parent->FromDIP(wxSize(-1, 280)), wxDV_SINGLE | wxDV_ROW_LINES) {
   SetName("Formats");
   AppendToggleColumn("On", wxDATAVIEW_CELL_ACTIVATABLE, FromDIP(50), wxALIGN_CENTER);
-  AppendTextColumn("Format", wxDATAVIEW_CELL_INERT, FromDIP(300));
-  AppendTextColumn("In this build", wxDATAVIEW_CELL_INERT, FromDIP(150));
+  AppendTextColumn("Format", wxDATAVIEW_CELL_INERT, TextWidth(*this, 300));
+  AppendTextColumn("In this build", wxDATAVIEW_CELL_INERT, TextWidth(*this, 150));
   for (const int32_t index : FormatListRows()) {
     const FormatEntry& row = FormatRow(index);
     wxVector<wxVariant> cells;

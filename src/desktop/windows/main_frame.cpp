@@ -127,6 +127,14 @@ void MainFrame::BuildToolbar() {
     bar->AddTool(CommandId(command), label, Symbol(command.symbol, 20), command.help);
   }
   bar->Realize();
+  // Symbols are in the colour of texts.
+  Bind(wxEVT_SYS_COLOUR_CHANGED, [this, bar](wxSysColourChangedEvent& event) {
+    for (const Command& command : Commands()) {
+      if (command.symbol != nullptr) bar->SetToolNormalBitmap(CommandId(command), Symbol(command.symbol, 20));
+    }
+    LogEvent("colours", "changed");
+    event.Skip();
+  });
 }
 
 bool MainFrame::Enabled(const Command& command) const {

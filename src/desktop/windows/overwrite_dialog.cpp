@@ -10,6 +10,7 @@
 #include "core/settings.h"
 #include "desktop/windows/bitmaps.h"
 #include "desktop/windows/help.h"
+#include "desktop/windows/looks.h"
 #include "desktop/windows/wx_text.h"
 #include "platform/paths.h"
 
@@ -40,7 +41,7 @@ OverwriteDialog::OverwriteDialog(wxWindow* parent, const OverwriteQuestion& ques
   sizer->Add(row, below);
   if (!question.problem.empty()) {
     auto* problem = new wxStaticText(this, wxID_ANY, Shown(question.problem));
-    problem->SetForegroundColour(wxColour(0xc6, 0x28, 0x28));
+    problem->SetForegroundColour(FaultColour());
     sizer->Add(problem, below);
   }
   if (question.checks.previews) sizer->Add(panes_ = MakePreviews(question, preview), wxSizerFlags(1).Expand().Border(wxALL, gap));

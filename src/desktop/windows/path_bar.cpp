@@ -41,6 +41,10 @@ PathBar::PathBar(wxWindow* parent, const FolderTrail& trail, Events events)
                                     wxDefaultValidator, tip);
     made->SetToolTip(tip);
     made->Bind(wxEVT_BUTTON, [run](wxCommandEvent&) { run(); });
+    made->Bind(wxEVT_SYS_COLOUR_CHANGED, [made, symbol](wxSysColourChangedEvent& event) {
+      made->SetBitmap(Symbol(symbol));
+      event.Skip();
+    });
     row->Add(made, wxSizerFlags().CenterVertical().Border(wxLEFT, gap));
     return made;
   };

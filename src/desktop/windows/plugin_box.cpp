@@ -9,6 +9,7 @@
 #include "core/configuration.h"
 #include "core/settings.h"
 #include "desktop/event_log.h"
+#include "desktop/windows/looks.h"
 #include "desktop/windows/wx_text.h"
 #include "picture/registry.h"
 #include "platform/folders.h"
@@ -35,7 +36,7 @@ PluginBox::PluginBox(wxWindow* parent)
     int width;
   };
   for (const Column& column : {Column{"Extension", 90}, {"Plug-in", 140}, {"Formats", 200}, {"Can", 150}, {"Module", 150}}) {
-    list_->AppendTextColumn(column.title, wxDATAVIEW_CELL_INERT, FromDIP(column.width));
+    list_->AppendTextColumn(column.title, wxDATAVIEW_CELL_INERT, TextWidth(*this, column.width));
   }
   const std::string folder = platform::JoinFolder(platform::ProgramFolder(), "plugin");
   auto* place = new wxStaticText(this, wxID_ANY, Shown("Plug-ins lie in the folder " + folder), wxDefaultPosition, wxDefaultSize,

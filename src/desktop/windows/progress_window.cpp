@@ -16,6 +16,7 @@
 #include "core/settings.h"
 #include "core/text.h"
 #include "desktop/windows/bitmaps.h"
+#include "desktop/windows/looks.h"
 #include "desktop/windows/wx_text.h"
 #include "platform/clock.h"
 #include "platform/paths.h"
@@ -56,7 +57,7 @@ class ProgressWindow::DrawnList : public wxVListBox {
     }
     const bool failed = row.line.item.status != Status::Ok && !row.line.item.skipped;
     wxColour text = wxSystemSettings::GetColour(IsSelected(n) ? wxSYS_COLOUR_HIGHLIGHTTEXT : wxSYS_COLOUR_LISTBOXTEXT);
-    if (failed && !IsSelected(n)) text = wxColour(0xc6, 0x28, 0x28);
+    if (failed && !IsSelected(n)) text = ToWx(CurrentPalette().fault);
     dc.SetTextForeground(text);
     dc.SetFont(GetFont());
     const wxRect place(left, rect.y, rect.GetRight() - left - FromDIP(4), rect.height);
@@ -177,9 +178,13 @@ void ProgressWindow::LayOut() {
   // The bar takes the gap between list and status line.
   const int32_t under = layout.list.y + layout.list.height;
   put(bar_, {layout.list.x, under + 2, layout.list.width, std::max(layout.status.y - under - 4, 2)});
-  const int32_t half = (layout.close.x - layout.abort.x) / 2;
-  put(copy_, {layout.abort.x - half / 2 - 12, layout.abort.y, 84, layout.abort.height});
-  put(select_, {layout.close.x - half + half / 4, layout.close.y, 100, layout.close.height});
+  // The buttons for files that failed take the place of the one that stops, as wide as their texts where there is room.
+  const int gap = 4, room = layout.close.x - layout.list.x - 2 * gap;
+  const int copy = ToDIP(copy_->GetBestSize().x), select = ToDIP(select_->GetBestSize().x);
+  const int copyWidth = copy + select <= room ? copy : std::max(room * copy / (copy + select), 1);
+  const int selectWidth = copy + select <= room ? select : std::max(room - copyWidth, 1);
+  put(copy_, {layout.list.x, layout.abort.y, copyWidth, layout.abort.height});
+  put(select_, {layout.list.x + copyWidth + gap, layout.close.y, selectWidth, layout.close.height});
 }
 
 int ProgressWindow::FirstVisible() const {

@@ -1,13 +1,14 @@
 #include "desktop/windows/report_tree.h"
 
+#include "desktop/windows/looks.h"
 #include "desktop/windows/wx_text.h"
 
 namespace fotomill::desktop {
 
 ReportTree::ReportTree(wxWindow* parent) : wxTreeListCtrl(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTL_SINGLE) {
   SetName("Facts");
-  AppendColumn("Name", FromDIP(260), wxALIGN_LEFT, wxCOL_RESIZABLE);
-  AppendColumn("Value", FromDIP(360), wxALIGN_LEFT, wxCOL_RESIZABLE);
+  AppendColumn("Name", TextWidth(*this, 260), wxALIGN_LEFT, wxCOL_RESIZABLE);
+  AppendColumn("Value", TextWidth(*this, 360), wxALIGN_LEFT, wxCOL_RESIZABLE);
 }
 
 void ReportTree::Show(std::span<const InfoSection> sections) {

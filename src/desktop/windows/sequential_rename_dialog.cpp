@@ -24,6 +24,7 @@
 #include "desktop/windows/batch_runner.h"
 #include "desktop/windows/file_actions.h"
 #include "desktop/windows/help.h"
+#include "desktop/windows/looks.h"
 #include "desktop/windows/main_frame.h"
 #include "desktop/windows/wx_text.h"
 #include "platform/paths.h"
@@ -126,10 +127,10 @@ SequentialRenameDialog::SequentialRenameDialog(wxWindow* parent, const std::vect
     flags->Add(flags_[i], wxSizerFlags().Border(wxRIGHT | wxBOTTOM, gap));
   }
   sizer->Add(flags, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT, gap));
-  preview_ = new wxListCtrl(this, wxID_ANY, wxDefaultPosition, FromDIP(wxSize(520, 220)), wxLC_REPORT | wxLC_SINGLE_SEL,
-                            wxDefaultValidator, "New names");
-  preview_->AppendColumn("Old name", wxLIST_FORMAT_LEFT, FromDIP(250));
-  preview_->AppendColumn("New name", wxLIST_FORMAT_LEFT, FromDIP(250));
+  preview_ = new wxListCtrl(this, wxID_ANY, wxDefaultPosition, wxSize(TextWidth(*this, 520), FromDIP(220)),
+                            wxLC_REPORT | wxLC_SINGLE_SEL, wxDefaultValidator, "New names");
+  preview_->AppendColumn("Old name", wxLIST_FORMAT_LEFT, TextWidth(*this, 250));
+  preview_->AppendColumn("New name", wxLIST_FORMAT_LEFT, TextWidth(*this, 250));
   sizer->Add(preview_, wxSizerFlags(1).Expand().Border(wxLEFT | wxRIGHT, gap));
   problem_ = new wxStaticText(this, wxID_ANY, "");
   sizer->Add(problem_, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxTOP, gap));
@@ -182,7 +183,7 @@ void SequentialRenameDialog::UpdateControls() {
     const bool bad = outcome.status != Status::Ok || outcome.skipped;
     failed += bad ? 1 : 0;
     preview_->SetItem(row, 1, bad ? wxString("stays as it is") : Shown(platform::FileNameOf(outcome.destination)));
-    if (bad) preview_->SetItemTextColour(row, wxColour(0xc6, 0x28, 0x28));
+    if (bad) preview_->SetItemTextColour(row, ToWx(CurrentPalette().fault));
   }
   preview_->Thaw();
   problem_->SetLabel(failed == 0 ? wxString() : wxString::Format("%zu of the files shown cannot get a new name.", failed));

@@ -14,6 +14,7 @@
 #include "core/text.h"
 #include "desktop/event_log.h"
 #include "desktop/windows/bitmaps.h"
+#include "desktop/windows/looks.h"
 #include "desktop/windows/screen_reader.h"
 #include "desktop/windows/wx_text.h"
 #include "picture/registry.h"
@@ -81,10 +82,10 @@ void ThumbnailCanvas::MeasureCells() {
   const int padding = FromDIP(kPadding);
   if (ListsNames()) {
     square_ = 0;
-    layout_.SetCells(FromDIP(kListWidth), textHeight_ + padding, FromDIP(2));
+    layout_.SetCells(TextWidth(*this, kListWidth), textHeight_ + padding, FromDIP(2));
   } else {
     square_ = FromDIP(model_.Modes().view == choice::kViewSmall ? 48 : model_.Modes().view == choice::kViewLarge ? 176 : 96);
-    const int width = std::max(square_ + 4 * padding, FromDIP(96));
+    const int width = std::max(square_ + 4 * padding, TextWidth(*this, 96));
     layout_.SetCells(width, square_ + textHeight_ + 3 * padding, FromDIP(4));
   }
   layout_.SetCount(model_.LineCount());

@@ -8,6 +8,7 @@
 #include "core/text.h"
 #include "desktop/event_log.h"
 #include "desktop/windows/bitmaps.h"
+#include "desktop/windows/looks.h"
 #include "desktop/windows/thumbnail_badges.h"
 #include "desktop/windows/thumbnail_canvas.h"
 #include "desktop/windows/wx_text.h"
@@ -21,22 +22,16 @@ namespace {
 constexpr double kBitmapBytes = 96e6;  // kept for drawing, beside the thumbnails themselves
 constexpr size_t kMostCutNames = 5000;
 
-wxColour Blend(const wxColour& a, const wxColour& b, double part) {
-  const auto mix = [part](int x, int y) { return static_cast<unsigned char>(std::lround(x + (y - x) * part)); };
-  return {mix(a.Red(), b.Red()), mix(a.Green(), b.Green()), mix(a.Blue(), b.Blue())};
-}
-
 }  // namespace
 
 // The colours of one painting.
 struct ThumbnailCanvas::Looks {
-  wxColour background = wxSystemSettings::GetColour(wxSYS_COLOUR_LISTBOX);
-  wxColour text = wxSystemSettings::GetColour(wxSYS_COLOUR_LISTBOXTEXT);
-  wxColour highlight = wxSystemSettings::GetColour(wxSYS_COLOUR_HIGHLIGHT);
-  wxColour highlightText = wxSystemSettings::GetColour(wxSYS_COLOUR_HIGHLIGHTTEXT);
-  wxColour frame = Blend(background, text, 0.18);
-  wxColour faint = Blend(background, text, 0.06);
-  wxColour note = Blend(background, text, 0.62);
+  ListPalette palette = CurrentPalette();
+  wxColour background = ToWx(palette.background), text = ToWx(palette.text);
+  wxColour selected = ToWx(palette.selected), selectedText = ToWx(palette.selectedText);
+  wxColour resting = ToWx(palette.resting), restingText = ToWx(palette.restingText);
+  wxColour frame = ToWx(palette.frame), faint = ToWx(palette.faint);
+  wxColour note = ToWx(palette.note), fault = ToWx(palette.fault);
 };
 
 // Painting tells the log when the first one, and the first one with files, was done, and which ones were slow.
@@ -67,8 +62,8 @@ void ThumbnailCanvas::Paint() {
   if (banding_ && pressed_) {
     const wxRect band(wxPoint(std::min(pressed_->x, bandEnd_.x), static_cast<int>(std::min(pressed_->y, bandEnd_.y) - scroll_)),
                       wxSize(std::abs(pressed_->x - bandEnd_.x) + 1, std::abs(pressed_->y - bandEnd_.y) + 1));
-    dc.SetPen(wxPen(looks.highlight));
-    dc.SetBrush(wxBrush(wxColour(looks.highlight.Red(), looks.highlight.Green(), looks.highlight.Blue(), 48)));
+    dc.SetPen(wxPen(looks.selected));
+    dc.SetBrush(wxBrush(wxColour(looks.selected.Red(), looks.selected.Green(), looks.selected.Blue(), 48)));
     dc.DrawRectangle(band);
   }
 }
@@ -78,25 +73,25 @@ void ThumbnailCanvas::DrawCell(wxDC& dc, size_t line, const Looks& looks) {
   const wxRect cell(place.x, static_cast<int>(place.y - scroll_), place.width, place.height);
   const bool selected = model_.Selected().IsSelected(line);
   const bool focused = model_.Selected().Focus() == line && HasFocus();
-  const wxColour marked = HasFocus() ? looks.highlight : Blend(looks.highlight, looks.background, 0.45);
+  const wxColour text = !selected ? looks.text : HasFocus() ? looks.selectedText : looks.restingText;
   if (selected) {
     dc.SetPen(*wxTRANSPARENT_PEN);
-    dc.SetBrush(wxBrush(marked));
+    dc.SetBrush(wxBrush(HasFocus() ? looks.selected : looks.resting));
     dc.DrawRoundedRectangle(cell, FromDIP(5));
   }
   if (focused) {
-    dc.SetPen(wxPen(selected ? looks.highlightText : looks.highlight, FromDIP(1), wxPENSTYLE_DOT));
+    dc.SetPen(wxPen(selected ? looks.selectedText : looks.selected, FromDIP(1), wxPENSTYLE_DOT));
     dc.SetBrush(*wxTRANSPARENT_BRUSH);
     dc.DrawRoundedRectangle(wxRect(cell).Deflate(FromDIP(2)), FromDIP(4));
   }
   const FolderItem& item = model_.Line(line);
   const int padding = FromDIP(kPadding);
-  dc.SetTextForeground(selected ? looks.highlightText : looks.text);
+  dc.SetTextForeground(text);
   if (square_ == 0) {
     const wxRect icon(cell.x + padding, cell.y + (cell.height - FromDIP(16)) / 2, FromDIP(16), FromDIP(16));
     DrawPlaceholder(dc, item, icon, {}, looks);
     const int left = icon.GetRight() + padding;
-    dc.SetTextForeground(selected ? looks.highlightText : looks.text);
+    dc.SetTextForeground(text);
     dc.DrawText(CutName(dc, item.name, cell.GetRight() - left - padding), left, cell.y + (cell.height - textHeight_) / 2);
     return;
   }
@@ -104,7 +99,7 @@ void ThumbnailCanvas::DrawCell(wxDC& dc, size_t line, const Looks& looks) {
   DrawPicture(dc, line, square, looks);
   if (line == editedLine_) return;
   const wxString name = CutName(dc, item.name, cell.width - 2 * FromDIP(3));
-  dc.SetTextForeground(selected ? looks.highlightText : looks.text);
+  dc.SetTextForeground(text);
   dc.DrawText(name, cell.x + (cell.width - dc.GetTextExtent(name).x) / 2, square.GetBottom() + 1 + padding);
 }
 
@@ -138,7 +133,7 @@ void ThumbnailCanvas::DrawPicture(wxDC& dc, size_t line, const wxRect& square, c
   dc.SetPen(wxPen(looks.frame));
   dc.SetBrush(*wxTRANSPARENT_BRUSH);
   dc.DrawRectangle(wxRect(corner, shown).Inflate(1));
-  DrawBadges(dc, *this, wxRect(corner, shown), *thumbnail, looks.highlight, looks.highlightText);
+  DrawBadges(dc, *this, wxRect(corner, shown), *thumbnail, looks.selected, looks.selectedText);
 }
 
 // A folder, or a sheet with the file's extension: what there is before, or instead of, a thumbnail.
@@ -161,7 +156,7 @@ void ThumbnailCanvas::DrawPlaceholder(wxDC& dc, const FolderItem& item, const wx
   dc.SetBrush(wxBrush(looks.faint));
   dc.DrawRoundedRectangle(sheet, std::max(square.width / 32.0, 1.0));
   if (square.width < FromDIP(40)) return;
-  dc.SetTextForeground(mark.empty() ? looks.note : wxColour(0xd0, 0x38, 0x2c));
+  dc.SetTextForeground(mark.empty() ? looks.note : looks.fault);
   wxRect text(sheet);
   if (!mark.empty()) {
     const wxFont font = dc.GetFont();

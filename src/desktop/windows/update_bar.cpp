@@ -2,13 +2,13 @@
 
 #include <wx/button.h>
 #include <wx/choice.h>
-#include <wx/settings.h>
 #include <wx/sizer.h>
 #include <wx/stattext.h>
 
 #include <iterator>
 
 #include "catalog/thumbnail_update.h"
+#include "desktop/windows/looks.h"
 #include "desktop/windows/wx_text.h"
 
 namespace fotomill::desktop {
@@ -16,12 +16,11 @@ namespace fotomill::desktop {
 UpdateBar::UpdateBar(wxWindow* parent, std::function<void(int32_t choice)> answered)
     : wxPanel(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTAB_TRAVERSAL | wxBORDER_NONE, "UpdateThumbnailsBox"),
       answered_(std::move(answered)) {
-  // A tint of the window's own colours, light or dark.
-  const wxColour window = wxSystemSettings::GetColour(wxSYS_COLOUR_WINDOW);
-  const wxColour highlight = wxSystemSettings::GetColour(wxSYS_COLOUR_HIGHLIGHT);
-  const auto tint = [](int from, int to) { return static_cast<unsigned char>(from + (to - from) / 7); };
-  SetBackgroundColour(wxColour(tint(window.Red(), highlight.Red()), tint(window.Green(), highlight.Green()),
-                               tint(window.Blue(), highlight.Blue())));
+  SetBackgroundColour(BarColour());
+  Bind(wxEVT_SYS_COLOUR_CHANGED, [this](wxSysColourChangedEvent& event) {
+    SetBackgroundColour(BarColour());
+    event.Skip();
+  });
   const int gap = FromDIP(6);
   text_ = new wxStaticText(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxST_ELLIPSIZE_END);
   choices_ = new wxChoice(this, wxID_ANY);
