@@ -26,10 +26,13 @@ wxColour FaultColour() {
   return ToWx(PaletteOf(window, SystemShade(wxSYS_COLOUR_BTNTEXT), window, window).fault);
 }
 
-int TextWidth(const wxWindow& window, int width) {
+double TextScale(const wxWindow& window) {
   constexpr double kUsualHeight = 17;  // of a line, device-independent pixels
-  const double scale = std::max(window.GetCharHeight() / (kUsualHeight * window.FromDIP(1)), 1.0);
-  return static_cast<int>(std::lround(window.FromDIP(width) * scale));
+  return std::max(window.GetCharHeight() / (kUsualHeight * window.FromDIP(1)), 1.0);
+}
+
+int TextWidth(const wxWindow& window, int width) {
+  return static_cast<int>(std::lround(window.FromDIP(width) * TextScale(window)));
 }
 
 wxColour BarColour() { return ToWx(Blend(SystemShade(wxSYS_COLOUR_WINDOW), SystemShade(wxSYS_COLOUR_HIGHLIGHT), 1.0 / 7)); }

@@ -14,6 +14,8 @@ wxColour FaultColour();
 // Of a bar that stands out of its window a little.
 wxColour BarColour();
 
+// How much larger texts are than usual, at least 1.
+double TextScale(const wxWindow& window);
 // A width for text, given for texts of the usual size: wider where the user wants larger ones.
 int TextWidth(const wxWindow& window, int width);
 

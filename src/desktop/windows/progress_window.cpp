@@ -77,7 +77,7 @@ class ProgressWindow::DrawnList : public wxVListBox {
 
   wxCoord OnMeasureItem(size_t n) const override {
     const int fixed = LayOutProgressBox(1, 1, box_.settings_).rowHeight;
-    if (fixed > 0) return FromDIP(fixed);
+    if (fixed > 0) return TextWidth(*this, fixed);
     const bool tall = box_.settings_.thumbnails && HasPicture(box_.rows_[n]);
     return tall ? FromDIP(kThumbnailSide + 6) : GetCharHeight() + FromDIP(8);
   }
@@ -150,10 +150,11 @@ ProgressWindow::ProgressWindow(wxWindow* frame, ThumbnailService& thumbnails, Ev
     if (event.CanVeto()) event.Veto();
     if (done_) events_.closed();
   });
-  const wxSize client = ToDIP(frame->GetClientSize());
+  const wxSize client = InUnits(frame->GetClientSize());
   const Rectangle place = ProgressBoxPlace(client.x, client.y, settings_);
-  SetSize(FromDIP(wxSize(place.width, place.height)));
-  SetPosition(frame->ClientToScreen(FromDIP(wxPoint(place.x, place.y))));
+  const wxRect pixels = InPixels(place);
+  SetSize(pixels.GetSize());
+  SetPosition(frame->ClientToScreen(pixels.GetPosition()));
   if (settings.ProgressRaiseAppWindow == 0) SetExtraStyle(GetExtraStyle() | wxWS_EX_BLOCK_EVENTS);
 }
 
@@ -165,12 +166,18 @@ wxWindow* ProgressWindow::MakeList(bool scrollBar) {
   return plain_ = new PlainList(*this, scrollBar ? wxLB_ALWAYS_SB : 0);
 }
 
+// The box's geometry is in pixels of a screen of the usual resolution, with texts of the usual size.
+wxSize ProgressWindow::InUnits(const wxSize& pixels) const { return ToDIP(pixels) / TextScale(*this); }
+
+wxRect ProgressWindow::InPixels(const Rectangle& units) const {
+  const auto pixels = [this](int32_t length) { return TextWidth(*this, length); };
+  return {pixels(units.x), pixels(units.y), pixels(units.width), pixels(units.height)};
+}
+
 void ProgressWindow::LayOut() {
-  const wxSize client = ToDIP(panel_->GetClientSize());
+  const wxSize client = InUnits(panel_->GetClientSize());
   const ProgressLayout layout = LayOutProgressBox(client.x, client.y, settings_);
-  const auto put = [this](wxWindow* window, const Rectangle& place) {
-    window->SetSize(wxRect(FromDIP(wxPoint(place.x, place.y)), FromDIP(wxSize(place.width, place.height))));
-  };
+  const auto put = [this](wxWindow* window, const Rectangle& place) { window->SetSize(InPixels(place)); };
   put(list_, layout.list);
   put(status_, layout.status);
   put(abort_, layout.abort);
@@ -180,7 +187,7 @@ void ProgressWindow::LayOut() {
   put(bar_, {layout.list.x, under + 2, layout.list.width, std::max(layout.status.y - under - 4, 2)});
   // The buttons for files that failed take the place of the one that stops, as wide as their texts where there is room.
   const int gap = 4, room = layout.close.x - layout.list.x - 2 * gap;
-  const int copy = ToDIP(copy_->GetBestSize().x), select = ToDIP(select_->GetBestSize().x);
+  const int copy = InUnits(copy_->GetBestSize()).x, select = InUnits(select_->GetBestSize()).x;
   const int copyWidth = copy + select <= room ? copy : std::max(room * copy / (copy + select), 1);
   const int selectWidth = copy + select <= room ? select : std::max(room - copyWidth, 1);
   put(copy_, {layout.list.x, layout.abort.y, copyWidth, layout.abort.height});

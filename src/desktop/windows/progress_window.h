@@ -41,6 +41,8 @@ class ProgressWindow : public wxFrame {
     std::string source;
   };
   wxWindow* MakeList(bool scrollBar);
+  wxSize InUnits(const wxSize& pixels) const;
+  wxRect InPixels(const Rectangle& units) const;
   void LayOut();
   // Shows what has come since the last time: many lines at once cost as much as one.
   void GatherNews();

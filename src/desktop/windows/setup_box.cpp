@@ -20,6 +20,7 @@
 #include "desktop/windows/batch_runner.h"
 #include "desktop/windows/format_list.h"
 #include "desktop/windows/help.h"
+#include "desktop/windows/looks.h"
 #include "desktop/windows/main_frame.h"
 #include "desktop/windows/wx_text.h"
 #include "platform/files.h"
@@ -91,7 +92,7 @@ SetupBox::SetupBox(wxWindow* parent, std::function<void()> applied, SetupPage fi
   column->Add(middle, wxSizerFlags(1).Expand());
   column->Add(BuildButtons(), wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, gap));
   SetSizer(column);
-  SetSize(FromDIP(wxSize(980, 680)));
+  SetSize(TextWidth(*this, 980), TextWidth(*this, 680));
   SetMinSize(FromDIP(wxSize(760, 420)));
 
   FillSetupDialog(controls_, destinations_);
