@@ -1,5 +1,6 @@
 #!/usr/bin/env python3
 """The browser and the view window of the real program, by keyboard."""
+import signal
 import time
 
 from driven_desktop import Desktop, Failure, gif_of_frames, make_pictures, run
@@ -219,4 +220,38 @@ def play_animation(folder):
         desktop.wait(r"view-frame frame 2 of 5$")
 
 
-run(open_select_view, compare, play_animation)
+def later_starts(folder):
+    pictures, other = folder / "pictures", folder / "other"
+    make_pictures(pictures, NAMES)
+    make_pictures(other, ["c.bmp"])
+    with Desktop(folder, pictures / "a2.png") as desktop:
+        # A file is shown first; its neighbours come when the folder has been listed.
+        desktop.wait(r"view place=1/1 .*status=0 .*a2.png")
+        desktop.wait(r"view-list 2/4")
+        later = desktop.start_again(other)
+        desktop.wait(r"taken-over .*other$")
+        assert later.wait(30) == 0
+        desktop.wait(r"browser tabs=2 lines=1 .*listing=0 .*folder=.*other$")
+        own = desktop.start_again("--new-instance", other)
+        desktop.wait(r"browser tabs=1 lines=1 .*listing=0 .*folder=.*other$")
+        own.terminate()
+        own.wait()
+        # One that hangs keeps nobody waiting, and does not do later what the other has done meanwhile.
+        desktop.program.send_signal(signal.SIGSTOP)
+        later = desktop.start_again(other)
+        desktop.wait(r"browser tabs=1 lines=1 .*listing=0 .*folder=.*other$")
+        desktop.program.send_signal(signal.SIGCONT)
+        later.terminate()
+        later.wait()
+        # One that was killed leaves nothing in the way.
+        desktop.program.kill()
+        desktop.program.wait()
+        assert "taken-over" not in desktop.log_text()[desktop.seen:]
+        desktop.start()
+        desktop.wait(r"^frame$")
+        later = desktop.start_again(other)
+        desktop.wait(r"taken-over .*other$")
+        assert later.wait(30) == 0
+
+
+run(open_select_view, compare, play_animation, later_starts)

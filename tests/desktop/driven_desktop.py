@@ -58,9 +58,11 @@ class Desktop:
             raise Failure("Xvfb did not start")
         home = self.folder / "home"
         home.mkdir(exist_ok=True)
+        runtime = self.folder / "run"
+        runtime.mkdir(mode=0o700, exist_ok=True)
         self.environment = dict(
             os.environ, DISPLAY=":" + number, HOME=str(home), XDG_DATA_HOME=str(home / ".local/share"), XDG_CONFIG_HOME=str(home / ".config"),
-            FOTOMILL_DATA=str(self.data), FOTOMILL_DESKTOP_LOG=str(self.log), GDK_BACKEND="x11", NO_AT_BRIDGE="1", LC_ALL="C.UTF-8",
+            XDG_RUNTIME_DIR=str(runtime), FOTOMILL_DATA=str(self.data), FOTOMILL_DESKTOP_LOG=str(self.log), GDK_BACKEND="x11", NO_AT_BRIDGE="1", LC_ALL="C.UTF-8",
             GTK_THEME="Adwaita", ASAN_OPTIONS=os.environ.get("ASAN_OPTIONS", "") + ":detect_leaks=0")
         self.start()
         return self
@@ -88,6 +90,10 @@ class Desktop:
         with self.output.open("w") as output:
             self.program = subprocess.Popen([program, *self.arguments], env=self.environment, stdout=output, stderr=output,
                                             stdin=subprocess.DEVNULL)
+
+    def start_again(self, *arguments):
+        """A later start of the program, beside the one that runs. Its events go to the same log."""
+        return subprocess.Popen([self.program.args[0], *map(str, arguments)], env=self.environment, stdin=subprocess.DEVNULL)
 
     # --- what comes out ---
 

@@ -1,6 +1,12 @@
 #include <wx/app.h>
 #include <wx/cmdline.h>
+#include <wx/weakref.h>
+
 #include <wx/image.h>
+#include <cstdlib>
+#include <functional>
+#include <memory>
+#include <string>
 
 #include "core/configuration.h"
 #include "core/data_folder.h"
@@ -14,9 +20,8 @@
 #include "desktop/windows/wx_text.h"
 #include "picture/format_switches.h"
 #include "picture/registry.h"
-#include "platform/files.h"
+#include "platform/first_start.h"
 #include "platform/folders.h"
-#include "platform/paths.h"
 #include "platform/process.h"
 #include "plugins/plugin_table.h"
 
@@ -24,16 +29,16 @@ namespace fotomill::desktop {
 
 namespace {
 
-// The folder to begin with, and the file in it to show, when the argument is one.
-struct Start {
-  std::string folder, file;
-};
+constexpr double kHandOverSeconds = 2;  // that a running program has to answer
 
-Start StartFrom(const std::string& argument) {
-  if (argument.empty()) return {platform::SpecialFolderPath(platform::SpecialFolder::Pictures), {}};
-  const std::string path = platform::AbsolutePath(argument);
-  if (platform::IsFolder(path)) return {path, {}};
-  return {platform::AbsolutePath(path + "/.."), path};
+// Starts of the same user on the same screen with the same data folder are one program.
+std::string NameOfInstance() {
+  std::string place = DataFolder();
+  for (const char* variable : {"WAYLAND_DISPLAY", "DISPLAY"}) {
+    const char* const screen = std::getenv(variable);
+    if (screen != nullptr) place += std::string("\n") + screen;
+  }
+  return std::to_string(std::hash<std::string>()(place));
 }
 
 }  // namespace
@@ -43,10 +48,12 @@ class App : public wxApp {
   void OnInitCmdLine(wxCmdLineParser& parser) override {
     parser.SetSwitchChars("-");
     parser.AddSwitch("h", "help", "tells how to call the program", wxCMD_LINE_OPTION_HELP);
+    parser.AddLongSwitch(kNewInstance, "opens a frame of its own, even where the program is running");
     parser.AddParam("FOLDER or FILE", wxCMD_LINE_VAL_STRING, wxCMD_LINE_PARAM_OPTIONAL);
   }
   bool OnCmdLineParsed(wxCmdLineParser& parser) override {
-    if (parser.GetParamCount() > 0) argument_ = Utf8(parser.GetParam(0));
+    if (parser.GetParamCount() > 0) argument_ = platform::AbsolutePath(Utf8(parser.GetParam(0)));
+    newInstance_ = parser.Found(kNewInstance);
     return true;
   }
 
@@ -58,6 +65,7 @@ class App : public wxApp {
     if (!wxApp::OnInit()) return false;
     wxImage::AddHandler(new wxPNGHandler);  // pictures travel over the clipboard as PNG
     SetDataFolder({});
+    if (!newInstance_ && HandOver()) return true;
     (void)LoadConfiguration();
     TakeFormatSwitches();
     NameControlsAsTheyCome();
@@ -68,15 +76,14 @@ class App : public wxApp {
     std::vector<uint8_t> screen = ReadScreenProfile();
     LogEvent("screen-profile", std::to_string(screen.size()));
     SetScreenProfile(std::move(screen));
-    const Start start = StartFrom(argument_);
-    auto* frame = new MainFrame;
-    const bool restored = frame->RestoreSession();
-    if (!restored || !argument_.empty()) {
-      frame->ShowFolder(platform::IsFolder(start.folder) ? start.folder : platform::CurrentFolder());
-    }
-    frame->Show();
+    frame_ = new MainFrame;
+    frame_->RestorePlace();
+    frame_->Show();
     LogEvent("frame");
-    if (!start.file.empty()) frame->ViewFiles({start.file}, start.file);
+    frame_->OpenStart(argument_, true);
+    firstStart_.Listen([this](std::shared_ptr<platform::LaterStart> start) {
+      CallAfter([this, start = std::move(start)] { TakeOver(*start); });
+    });
     return true;
   }
 
@@ -89,13 +96,35 @@ class App : public wxApp {
     return Event_Skip;
   }
 
+  // One that has handed over has no window to wait for.
+  int OnRun() override { return frame_ == nullptr ? 0 : wxApp::OnRun(); }
+
   int OnExit() override {
-    RunFormatShutdown();
+    if (frame_ != nullptr) RunFormatShutdown();
     return wxApp::OnExit();
   }
 
  private:
-  std::string argument_;
+  static constexpr const char* kNewInstance = "new-instance";
+
+  bool HandOver() {
+    const auto standing = firstStart_.Begin(NameOfInstance(), argument_, kHandOverSeconds);
+    if (standing == platform::FirstStart::Standing::HandedOver) LogEvent("handed-over", argument_);
+    return standing == platform::FirstStart::Standing::HandedOver;
+  }
+
+  void TakeOver(platform::LaterStart& start) {
+    if (frame_ == nullptr || !start.Take()) return;
+    LogEvent("taken-over", start.Message());
+    if (frame_->IsIconized()) frame_->Iconize(false);
+    frame_->Raise();
+    frame_->OpenStart(start.Message(), false);
+  }
+
+  std::string argument_;  // an absolute path, or empty
+  bool newInstance_ = false;
+  wxWeakRef<MainFrame> frame_;
+  platform::FirstStart firstStart_;
 };
 
 }  // namespace fotomill::desktop

@@ -236,12 +236,16 @@ BrowserPage* MainFrame::OpenTab(const std::string& folder) {
   return page;
 }
 
-bool MainFrame::RestoreSession() {
+void MainFrame::RestorePlace() {
   const Session session = LoadSession();
   if (session.width > 0 && session.height > 0)
     SetSize(FromDIP(wxSize(std::max(session.width, 400), std::max(session.height, 300))));
   if (session.maximized) Maximize();
   columns_ = ParseDetailColumns(session.columns);
+}
+
+bool MainFrame::RestoreTabs() {
+  const Session session = LoadSession();
   if (settings.RememberOpenWindows == 0 || session.tabs.empty()) return false;
   OpenTabs(session);
   return true;
@@ -392,6 +396,7 @@ void MainFrame::BrowserChanged() {
   if (tabs_->GetPageToolTip(tab) != Shown(model.Folder())) tabs_->SetPageToolTip(tab, Shown(model.Folder()));
   if (GetTitle() != name + " - " + kTitle) SetTitle(name + " - " + kTitle);
   SetStatusText(Shown(model.CountText()), kCountField);
+  if (wantsList_ != nullptr && !browser->Listing() && wantsList_->TakeList(model.ShownFiles())) wantsList_ = nullptr;
   tree_->Follow(model.Folder());
   LogState();
 }
@@ -403,9 +408,25 @@ void MainFrame::ViewFile(const std::string& path) {
   ViewFiles(selected.size() > 1 ? selected : browser->Model().ShownFiles(), path);
 }
 
-void MainFrame::ViewFiles(const std::vector<std::string>& list, const std::string& file) {
+ViewFrame* MainFrame::ViewFiles(const std::vector<std::string>& list, const std::string& file) {
   auto* view = new ViewFrame(*this, list, file);
   view->Show();
+  return view;
+}
+
+void MainFrame::OpenStart(const std::string& path, bool restore) {
+  const auto show = [this, restore](std::string folder) {
+    const bool restored = restore && RestoreTabs();
+    if (folder.empty() && (restored || Browser() != nullptr)) return;
+    if (folder.empty()) folder = platform::SpecialFolderPath(platform::SpecialFolder::Pictures);
+    ShowFolder(platform::IsFolder(folder) ? folder : platform::CurrentFolder());
+  };
+  if (path.empty() || platform::IsFolder(path)) return show(path);
+  ViewFrame* const view = ViewFiles({path}, path);
+  view->WhenShown([this, show, folder = platform::AbsolutePath(path + "/.."), weak = wxWeakRef<ViewFrame>(view)] {
+    wantsList_ = weak.get();
+    show(folder);
+  });
 }
 
 void MainFrame::RenameFile(const std::string& path, const std::string& name) { files_->Rename(path, name); }

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <wx/frame.h>
+#include <wx/weakref.h>
 
 #include <string>
 #include <vector>
@@ -40,8 +41,8 @@ class MainFrame : public wxFrame, public BrowserHost {
   BrowserPage* OpenTab(const std::string& folder);
   // The tab that shows the folder, or another one.
   BrowserPage* ShowFolder(const std::string& folder);
-  // The tabs of the last run, where they are to be remembered. False when there are none.
-  bool RestoreSession();
+  // Size and place of the last run.
+  void RestorePlace();
   void CloseTab();
   void ReopenTab();
   // Named sets of tabs.
@@ -68,8 +69,11 @@ class MainFrame : public wxFrame, public BrowserHost {
   void NoteUses(const std::vector<FileUse>& uses);
   void FlushUses();
 
+  // What the program was started with, a folder or a file: shows it. A file is shown at once and its folder listed
+  // afterwards; the tabs of the last time are opened with it when `restore`. Nothing: the tabs of the last time or a folder.
+  void OpenStart(const std::string& path, bool restore);
   // Opens a view window on a file, with the files of `list` as its neighbours.
-  void ViewFiles(const std::vector<std::string>& list, const std::string& file);
+  ViewFrame* ViewFiles(const std::vector<std::string>& list, const std::string& file);
   // Settings have changed: every window shows what they say now.
   void SettingsChanged();
   // A line in the status bar.
@@ -85,6 +89,8 @@ class MainFrame : public wxFrame, public BrowserHost {
   void DropFiles(const std::vector<std::string>& files, const std::string& folder, bool move) override;
 
  private:
+  // The tabs of the last run, where they are to be remembered. False when there are none.
+  bool RestoreTabs();
   void BuildMenus();
   void BuildToolbar();
   void BuildPanes();
@@ -107,6 +113,7 @@ class MainFrame : public wxFrame, public BrowserHost {
   wxAuiNotebook* tabs_ = nullptr;
   std::vector<std::string> closedTabs_;  // folders, the latest last
   std::string loggedState_;
+  wxWeakRef<ViewFrame> wantsList_;  // shows a file whose folder is being listed
   std::vector<FileUse> uses_;
   wxTimer usesTimer_;
   std::unique_ptr<BatchRunner> batches_;

@@ -79,6 +79,7 @@ ViewFrame::~ViewFrame() {
   // Their threads call back into this window.
   animation_.reset();
   loader_.reset();
+  if (shown_) frame_.CallAfter(shown_);
 }
 
 // --- which picture ---
@@ -196,6 +197,23 @@ void ViewFrame::TakePicture(ViewPicturePointer picture) {
   ShowTurned();
   animation_->Begin(loaded_);
   slideshow_.ShownAt(place_, list_.size());
+  if (shown_) frame_.CallAfter(std::exchange(shown_, nullptr));
+}
+
+void ViewFrame::WhenShown(std::function<void()> shown) {
+  if (IsCurrent(loaded_)) return frame_.CallAfter(shown);  // a small one may have come already
+  shown_ = std::move(shown);
+}
+
+bool ViewFrame::TakeList(const std::vector<std::string>& list) {
+  const auto found = std::ranges::find(list, list_[place_]);
+  if (found == list.end()) return false;
+  place_ = static_cast<size_t>(found - list.begin());
+  list_ = list;
+  WantPictures();
+  ViewChanged();
+  LogEvent("view-list", std::to_string(place_ + 1) + "/" + std::to_string(list_.size()));
+  return true;
 }
 
 void ViewFrame::Resized() {

@@ -3,6 +3,7 @@
 #include <wx/frame.h>
 #include <wx/timer.h>
 
+#include <functional>
 #include <memory>
 #include <string>
 #include <vector>
@@ -43,6 +44,10 @@ class ViewFrame : public wxFrame {
   void Redo();
   // Files were written: a picture whose file is another one now is loaded again.
   void FilesChanged();
+  // Calls once when the first picture is there, or the window goes without.
+  void WhenShown(std::function<void()> shown);
+  // The files that neighbour the picture from here on. False when it is not among them; they are as before then.
+  bool TakeList(const std::vector<std::string>& list);
   size_t LastPlace() const { return list_.size() - 1; }
   ViewCanvas& Canvas() { return *canvas_; }
 
@@ -77,6 +82,7 @@ class ViewFrame : public wxFrame {
   std::string note_;    // how the file was turned, where that is not as usual
   double keyTime_ = 0;  // when the picture that is awaited was asked for
   bool overlay_ = false;
+  std::function<void()> shown_;
   std::string painted_;  // what the log was told of
   wxTimer pointerTimer_;
   ViewCanvas* canvas_ = nullptr;
