@@ -4,6 +4,7 @@ import os
 import re
 import subprocess
 import sys
+import time
 from pathlib import Path
 
 try:
@@ -14,7 +15,7 @@ except ImportError:
     print("python3-gi is not installed: left out")
     sys.exit(77)
 
-from driven_desktop import Desktop, Failure, make_pictures, run
+from driven_desktop import PATIENCE, Desktop, Failure, make_pictures, run
 
 ACCESSIBLE = "org.a11y.atspi.Accessible"
 # Bits of the states of the accessibility interface.
@@ -114,22 +115,24 @@ class ReadDesktop(Desktop):
         print(f"{title}: {len(takers)} controls")
         if not tab:
             return
-        self.focused.clear()
-        self.xdotool("key", "--delay", 5, *["Tab"] * (len(takers) + 2))
-        self.settle()
-        while GLib.MainContext.default().iteration(False):
-            pass
-        # What is heard of a choice is its button, which is found by name only.
-        met = set(self.focused)
-        for reference in set(self.focused):
-            try:
-                met.add(self.property(reference, "Name"))
-            except GLib.Error:  # it has gone since
+        end = time.monotonic() + PATIENCE
+        missed = takers
+        while missed:
+            if time.monotonic() > end:
+                raise Failure(f"{title}: Tab never comes to {[str(heard) for heard in missed]}")
+            self.xdotool("key", "--delay", 5, *["Tab"] * (len(takers) + 2))
+            self.settle()
+            while GLib.MainContext.default().iteration(False):
                 pass
-        missed = [str(heard) for heard in takers
-                  if heard.has(ENABLED) and heard.role not in NOT_BY_TAB and not {heard.reference, heard.name} & met]
-        if missed:
-            raise Failure(f"{title}: Tab never comes to {missed}")
+            # What is heard of a choice is its button, which is found by name only.
+            met = set(self.focused)
+            for reference in set(self.focused):
+                try:
+                    met.add(self.property(reference, "Name"))
+                except GLib.Error:  # it has gone since
+                    pass
+            missed = [heard for heard in takers
+                      if heard.has(ENABLED) and heard.role not in NOT_BY_TAB and not {heard.reference, heard.name} & met]
 
 
 # Windows over the browser: the keys that open them, the log's line, the title. Without keys: words for the command finder.
