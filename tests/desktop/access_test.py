@@ -115,6 +115,7 @@ class ReadDesktop(Desktop):
         print(f"{title}: {len(takers)} controls")
         if not tab:
             return
+        self.focused.clear()
         end = time.monotonic() + PATIENCE
         missed = takers
         while missed:

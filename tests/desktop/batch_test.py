@@ -80,6 +80,13 @@ def errors_stay_and_abort_stops(folder):
         start_convert(desktop)
         confirm(desktop)
         desktop.wait(r"batch-line .*a.gif: ")
+        # Another batch waits for this one.
+        desktop.focus("Fotomill Professional", settle=False)
+        desktop.key("Home", "ctrl+e")
+        desktop.wait(r"prompt destination")
+        desktop.focus("^Convert$", settle=False)
+        desktop.key("Return")
+        desktop.wait(r"batch waiting=1")
         desktop.focus("^Progress$", settle=False)
         desktop.key("alt+a")
         desktop.wait(r"batch-line There were errors")
@@ -91,7 +98,14 @@ def errors_stay_and_abort_stops(folder):
         for path in written:
             if path.read_bytes()[:2] not in (b"II", b"MM") or path.stat().st_size < 1000:
                 raise Failure(f"{path.name} is not whole")
+        # It begins, and the box of the first one stays to be read.
+        desktop.wait(r"prompt format")
+        desktop.focus("^Destination$")
+        desktop.key("Return")
+        desktop.wait(r"batch-line .*a.gif: ")
+        desktop.wait(r"batch ended")
         desktop.screenshot("errors")
+        assert len(desktop.xdotool("search", "--onlyvisible", "--name", "^Progress$")) == 2
 
 
 run(convert_and_collide, errors_stay_and_abort_stops)

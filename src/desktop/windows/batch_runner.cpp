@@ -13,6 +13,7 @@
 #include "desktop/windows/destination_dialog.h"
 #include "desktop/windows/file_actions.h"
 #include "desktop/windows/main_frame.h"
+#include "desktop/windows/notification.h"
 #include "desktop/windows/overwrite_dialog.h"
 #include "desktop/windows/progress_window.h"
 #include "desktop/windows/prompt_for_destination.h"
@@ -41,17 +42,30 @@ void BatchRunner::Run(BatchJob job, BatchThread::Work work, std::shared_ptr<Prev
     StartNext();
   } else {
     frame_.Tell("The batch begins when the one before has ended.");
+    TellWaiting();
   }
+}
+
+void BatchRunner::TellWaiting() {
+  LogEvent("batch", "waiting=" + std::to_string(waiting_.size()));
+  if (box_ != nullptr) box_->SetWaiting(waiting_.size());
 }
 
 void BatchRunner::StartNext() {
   if (waiting_.empty()) return;
-  CloseBox();
+  LeaveBox();
   written_ = {DeedKind::Create, {}};
+  failed_ = 0;
   Waiting next = std::move(waiting_.front());
   waiting_.pop_front();
   previous_ = std::move(next.previous);
   thread_->StartWork(std::move(next.job), std::move(next.work));
+}
+
+// A box that stays to be read does so, whatever batch comes after it; another one goes.
+void BatchRunner::LeaveBox() {
+  if (box_ != nullptr && box_->StaysOpen()) box_ = nullptr;
+  CloseBox();
 }
 
 void BatchRunner::CloseBox() {
@@ -65,16 +79,21 @@ wxWindow* BatchRunner::DialogParent() const { return box_ != nullptr ? static_ca
 void BatchRunner::BatchOpened() {
   ProgressWindow::Events events;
   events.abort = [] { Abort(); };
-  events.closed = [this] { CallAfter([this] { CloseBox(); }); };
+  events.closed = [this](ProgressWindow& box) {
+    if (box_ == &box) box_ = nullptr;
+    box.Destroy();
+  };
   events.selectFailed = [this](const std::vector<std::string>& files) { frame_.SelectFiles(files); };
-  CloseBox();
+  LeaveBox();
   box_ = new ProgressWindow(&frame_, frame_.Thumbnails(), events);
   box_->Show();
+  TellWaiting();
   LogEvent("batch", "opened");
 }
 
 void BatchRunner::BatchLine(const ProgressLine& line, const FileOutcome& outcome) {
   LogEvent("batch-line", line.text);
+  failed_ += line.item.file >= 0 && outcome.status != Status::Ok && !outcome.skipped;
   if (box_ != nullptr) box_->AddLine(line, outcome.source);
   const bool written = outcome.status == Status::Ok && !outcome.skipped && !outcome.replaced && !outcome.destination.empty();
   if (written) written_.steps.push_back({outcome.source, platform::AbsolutePath(outcome.destination)});
@@ -88,12 +107,15 @@ void BatchRunner::BatchProgress(uint32_t done, uint32_t count) {
   if (box_ != nullptr) box_->SetProgress(done, count);
 }
 
+// Whether the user saw the end is told before the box moves the keyboard.
 void BatchRunner::BatchStaysOpen(const ProgressModel& model) {
+  seen_ = InFront();
   LogEvent("batch", "stays-open files=" + std::to_string(model.Files()));
   if (box_ != nullptr) box_->StayOpen();
 }
 
 void BatchRunner::BatchCloses() {
+  seen_ = InFront();
   LogEvent("batch", "closes");
   CloseBox();
 }
@@ -105,7 +127,8 @@ void BatchRunner::BatchEnded(Status status, const BatchJob& job) {
   if (job.formatIndex != kNoFormat) frame_.Files().NoteDone(std::exchange(written_, {}));
   if (previous_ != nullptr) frame_.Files().NoteDone(std::exchange(previous_, nullptr)->Deed());
   if (job.filesChanged) frame_.FilesChanged();
-  if (!frame_.IsActive() && (box_ == nullptr || !box_->IsActive())) frame_.RequestUserAttention(wxUSER_ATTENTION_INFO);
+  if (!seen_)
+    NotifyUser(frame_, failed_ == 0 ? "Batch finished" : "Batch finished with errors", Shown(CountLine(job.progress.Files())));
   if (status == Status::Ok) frame_.Tell(CountLine(job.progress.Files()));
   CallAfter([this] { StartNext(); });
 }

@@ -36,6 +36,8 @@ class BatchRunner : public wxEvtHandler, public BatchWindows {
     std::shared_ptr<PreviousFiles> previous;
   };
   void StartNext();
+  void TellWaiting();
+  void LeaveBox();
   void CloseBox();
 
   void BatchOpened() override;
@@ -55,7 +57,9 @@ class BatchRunner : public wxEvtHandler, public BatchWindows {
 
   MainFrame& frame_;
   std::deque<Waiting> waiting_;
-  ProgressWindow* box_ = nullptr;
+  ProgressWindow* box_ = nullptr;            // of the batch that runs or was the last
+  bool seen_ = false;                        // its end, by the user
+  size_t failed_ = 0;                        // files of the batch that runs
   std::shared_ptr<PreviousFiles> previous_;  // of the batch that runs
   FileDeed written_;                         // by the batch that runs, as far as it can be taken back
   std::unique_ptr<BatchThread> thread_;

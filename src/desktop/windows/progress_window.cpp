@@ -138,17 +138,17 @@ ProgressWindow::ProgressWindow(wxWindow* frame, ThumbnailService& thumbnails, Ev
     events_.abort();
   });
   Bind(wxEVT_TIMER, [this](wxTimerEvent&) { ShowNews(); });
-  close_->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { events_.closed(); });
+  close_->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { events_.closed(*this); });
   copy_->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { CopyList(); });
   select_->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { events_.selectFailed(FailedFiles()); });
   panel_->Bind(wxEVT_SIZE, [this](wxSizeEvent& event) { LayOut(), event.Skip(); });
   Bind(wxEVT_CHAR_HOOK, [this](wxKeyEvent& event) {
     if (event.GetKeyCode() != WXK_ESCAPE) return event.Skip();
-    if (done_) events_.closed();
+    if (done_) events_.closed(*this);
   });
   Bind(wxEVT_CLOSE_WINDOW, [this](wxCloseEvent& event) {
     if (event.CanVeto()) event.Veto();
-    if (done_) events_.closed();
+    if (done_) events_.closed(*this);
   });
   const wxSize client = InUnits(frame->GetClientSize());
   const Rectangle place = ProgressBoxPlace(client.x, client.y, settings_);
@@ -224,6 +224,11 @@ void ProgressWindow::SetProgress(uint32_t done, uint32_t count) {
   GatherNews();
 }
 
+void ProgressWindow::SetWaiting(size_t batches) {
+  waiting_ = batches;
+  GatherNews();
+}
+
 void ProgressWindow::GatherNews() {
   if (!newsTimer_.IsRunning()) newsTimer_.StartOnce(kNewsMs);
 }
@@ -243,7 +248,9 @@ void ProgressWindow::ShowNews() {
   const double passed = platform::MonotonicSeconds() - started_;
   const bool tells = passed >= kTimeLeftAfter && fileDone_ > 0 && fileDone_ < fileCount_ && abort_->IsEnabled();
   const wxString left = tells ? TimeLeft(passed / fileDone_ * (fileCount_ - fileDone_)) : wxString();
-  status_->SetLabel(Shown(text_) + left);
+  const char* const wait = waiting_ == 1 ? " batch waits" : " batches wait";
+  const wxString waiting = waiting_ == 0 || done_ ? wxString() : ", " + std::to_string(waiting_) + wait;
+  status_->SetLabel(Shown(text_) + left + waiting);
 }
 
 // The list is made anew with a scroll bar that always shows, at the same place and with the same rows in sight.

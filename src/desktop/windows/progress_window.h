@@ -22,7 +22,7 @@ class ProgressWindow : public wxFrame {
  public:
   struct Events {
     std::function<void()> abort;
-    std::function<void()> closed;
+    std::function<void(ProgressWindow& box)> closed;                          // the user is done with the box
     std::function<void(const std::vector<std::string>& files)> selectFailed;  // shows the failed files in their browser
   };
   ProgressWindow(wxWindow* frame, ThumbnailService& thumbnails, Events events);
@@ -30,8 +30,11 @@ class ProgressWindow : public wxFrame {
   void AddLine(const ProgressLine& line, const std::string& source);
   void SetStatus(const std::string& status);
   void SetProgress(uint32_t done, uint32_t count);
+  // How many batches wait for this one.
+  void SetWaiting(size_t batches);
   // The batch has ended and the box stays: closing lines are there, Close is live.
   void StayOpen();
+  bool StaysOpen() const { return done_; }
 
  private:
   class DrawnList;
@@ -60,6 +63,7 @@ class ProgressWindow : public wxFrame {
   bool done_ = false;
   std::string text_;  // of the status line, without the time left
   uint32_t fileDone_ = 0, fileCount_ = 0;
+  size_t waiting_ = 0;
   wxTimer newsTimer_;
   wxWindow* panel_ = nullptr;
   wxWindow* list_ = nullptr;
