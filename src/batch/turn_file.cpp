@@ -92,9 +92,11 @@ class Turning {
       return Fail(status, turned.obstacle);
     }
     if (!file.Intact()) return Status::FileReadError;
-    if (turned.way == JpegTurnWay::Tag && !turned.obstacle.empty())
-      result_.note = "Turned by its orientation alone. " + turned.obstacle;
     if (turned.way == JpegTurnWay::Trimmed) result_.note = "An edge was cut off.";
+    if (!turned.obstacle.empty()) {
+      const bool tag = turned.way == JpegTurnWay::Tag;
+      result_.note = (tag ? "Turned by its orientation alone. " : "It is left to its orientation. ") + turned.obstacle;
+    }
     return WriteUnlessThere(turned.way == JpegTurnWay::Nothing ? file.Bytes() : made, turned.way == JpegTurnWay::Nothing);
   }
 

@@ -110,7 +110,7 @@ class TurnBatch {
     outcome.hint = kept ? turned.hint : std::string("There is no room to keep the old file for undo.");
     outcome.note = turned.note;
     outcome.skipped = turned.status == Status::Ok && !turned.changed;
-    if (outcome.skipped) outcome.hint = "stands so already.";
+    if (outcome.skipped) outcome.hint = turned.note.empty() ? "stands so already." : turned.note;
     if (turned.status != Status::Ok) outcome.destination.clear();
   }
 
