@@ -232,6 +232,10 @@ def later_starts(folder):
         desktop.wait(r"taken-over .*other$")
         assert later.wait(30) == 0
         desktop.wait(r"browser tabs=2 lines=1 .*listing=0 .*folder=.*other$")
+        desktop.focus("Fotomill Professional")
+        for keys, name in (("ctrl+Tab", "pictures"), ("ctrl+shift+Tab", "other")):
+            desktop.key(keys)
+            desktop.wait(rf"browser tabs=2 .*folder=.*{name}$")
         own = desktop.start_again("--new-instance", other)
         desktop.wait(r"browser tabs=1 lines=1 .*listing=0 .*folder=.*other$")
         own.terminate()

@@ -173,8 +173,8 @@ constexpr Command kCommands[] = {
     {kGo, "&Enter a folder",       "Ctrl+L",       "Lets you type a folder.", Needs::Nothing, OfBrowser<&BrowserPage::EditPath>},
     {kGo, "F&avourite",            "Ctrl+D",       "Keeps this folder at the top of the folders at the left, or takes it away from there.", Needs::Nothing, ToggleFavourite, nullptr, false, IsFavourite},
     {kGo, nullptr},
-    {kGo, "&Next tab",             "Ctrl+PageDown", "Goes to the next tab.", Needs::Nothing, NextTab},
-    {kGo, "Pre&vious tab",         "Ctrl+PageUp",  "Goes to the previous tab.", Needs::Nothing, PreviousTab},
+    {kGo, "&Next tab",             "Ctrl+PageDown", "Goes to the next tab.", Needs::Nothing, NextTab, nullptr, false, nullptr, "Ctrl+Tab"},
+    {kGo, "Pre&vious tab",         "Ctrl+PageUp",  "Goes to the previous tab.", Needs::Nothing, PreviousTab, nullptr, false, nullptr, "Ctrl+Shift+Tab"},
 
     {kFunctions, "&View",          "Ctrl+Return",  "Shows the focused picture in a view window.", Needs::Files, View, "view", true},
     {kFunctions, "Com&pare",       "Ctrl+Shift+Return", "Shows two to four selected pictures beside each other.", Needs::Few, CompareSelection, nullptr, true},

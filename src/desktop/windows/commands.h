@@ -31,6 +31,7 @@ struct Command {
   const char* symbol = nullptr;                       // of the button in the toolbar (bitmaps.cpp), null for no button
   bool inContextMenu = false;                         // of a file in a browser
   bool (*checked)(const MainFrame& frame) = nullptr;  // whether its menu item has a mark; null for one that never has
+  const char* secondKey = nullptr;                    // that does the same
 };
 
 std::span<const Command> Commands();

@@ -38,6 +38,20 @@ constexpr const char* kTitle = "Fotomill Professional";
 constexpr int kHistoryMs = 2000;  // after the last use
 enum StatusField { kCountField, kMessageField, kFieldCount };
 
+// Why a command cannot be used at present.
+const char* WhatIsMissing(Needs needs) {
+  switch (needs) {
+    case Needs::Files: return "No picture is selected.";
+    case Needs::Few: return "Two to four pictures have to be selected.";
+    case Needs::Item: return "No file or folder is selected.";
+    case Needs::Undo: return "There is nothing to take back.";
+    case Needs::Redo: return "There is nothing to do again.";
+    case Needs::ClosedTab: return "No tab was closed.";
+    case Needs::Nothing: break;
+  }
+  return "";
+}
+
 // With its key, as menus show it and take it.
 wxString MenuText(const Command& command) {
   const wxString keys = *command.accelerator == '\0' ? wxString() : wxString("\t") + command.accelerator;
@@ -94,6 +108,12 @@ void MainFrame::BuildMenus() {
     menu->Append(CommandId(command), MenuText(command), command.help, command.checked != nullptr ? wxITEM_CHECK : wxITEM_NORMAL);
   }
   SetMenuBar(bar);
+  std::vector<wxAcceleratorEntry> keys;
+  for (const Command& command : Commands()) {
+    wxAcceleratorEntry key(0, 0, CommandId(command));
+    if (command.secondKey != nullptr && key.FromString(wxString("\t") + command.secondKey)) keys.push_back(key);
+  }
+  SetAcceleratorTable(wxAcceleratorTable(static_cast<int>(keys.size()), keys.data()));
   const int last = kFirstCommandId + static_cast<int>(Commands().size()) - 1;
   Bind(
       wxEVT_MENU,
@@ -107,6 +127,7 @@ void MainFrame::BuildMenus() {
       [this](wxUpdateUIEvent& event) {
         const Command& command = Commands()[static_cast<size_t>(event.GetId() - kFirstCommandId)];
         event.Enable(Enabled(command));
+        if (event.GetEventObject() == GetToolBar()) ShowTip(command);
         if (command.checked != nullptr) event.Check(command.checked(*this));
         if (command.needs != Needs::Undo && command.needs != Needs::Redo) return;
         const std::string name = command.needs == Needs::Undo ? files_->Undoable().UndoName() : files_->Undoable().RedoName();
@@ -135,6 +156,13 @@ void MainFrame::BuildToolbar() {
     LogEvent("colours", "changed");
     event.Skip();
   });
+}
+
+// The tip of a button that is grey says why.
+void MainFrame::ShowTip(const Command& command) {
+  const wxString key = *command.accelerator == '\0' ? wxString() : wxString(" (") + command.accelerator + ")";
+  const wxString tip = command.help + key + (Enabled(command) ? wxString() : wxString("\n") + WhatIsMissing(command.needs));
+  if (GetToolBar()->GetToolShortHelp(CommandId(command)) != tip) GetToolBar()->SetToolShortHelp(CommandId(command), tip);
 }
 
 bool MainFrame::Enabled(const Command& command) const {

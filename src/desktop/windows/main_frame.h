@@ -94,6 +94,7 @@ class MainFrame : public wxFrame, public BrowserHost {
   void BuildMenus();
   void BuildToolbar();
   void BuildPanes();
+  void ShowTip(const Command& command);
   bool Enabled(const Command& command) const;
   void OnTabChanged(wxAuiNotebookEvent& event);
   void OnClose(wxCloseEvent& event);
