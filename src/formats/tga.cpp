@@ -376,6 +376,15 @@ void WriteRow(const PictureRecord& picture, int32_t r, const TgaLayout& layout, 
   }
 }
 
+// What stands in front of the pixels, and the picture's facts from it.
+Status TakeHead(std::span<const uint8_t> file, TgaHeader& header, ColorMap& map, PictureRecord& picture) {
+  RETURN_IF_BAD(ParseHeader(file, header));
+  RETURN_IF_BAD(ReadColorMap(file, header, map));
+  DescribePicture(header, picture);
+  SetPalette(header, map, picture.palette);
+  return Status::Ok;
+}
+
 }  // namespace
 
 Status TgaInfo(PictureRecord& picture, const char* fileName, uint32_t) {
@@ -384,12 +393,8 @@ Status TgaInfo(PictureRecord& picture, const char* fileName, uint32_t) {
   if (!file.OpenHead(fileName, 65536)) return Status::FileOpenError;
   picture.fileSize = file.FileSize();
   TgaHeader header;
-  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
   ColorMap map;
-  RETURN_IF_BAD(ReadColorMap(file.Bytes(), header, map));
-  DescribePicture(header, picture);
-  SetPalette(header, map, picture.palette);
-  return Status::Ok;
+  return TakeHead(file.Bytes(), header, map, picture);
 }
 
 Status TgaRead(PictureRecord& picture, const char* fileName) {
@@ -399,11 +404,8 @@ Status TgaRead(PictureRecord& picture, const char* fileName) {
   platform::FileView file;
   if (!file.Open(fileName)) return Status::FileOpenError;
   TgaHeader header;
-  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
   ColorMap map;
-  RETURN_IF_BAD(ReadColorMap(file.Bytes(), header, map));
-  DescribePicture(header, picture);
-  SetPalette(header, map, picture.palette);
+  RETURN_IF_BAD(TakeHead(file.Bytes(), header, map, picture));
 
   ByteReader bytes(file.Bytes());
   bytes.Seek(header.PixelOffset());
