@@ -34,7 +34,7 @@ namespace fotomill {
 namespace {
 
 constexpr uint8_t kXmpFlag = 4, kExifFlag = 8, kAlphaFlag = 16, kIccFlag = 32;
-constexpr uint64_t kFileHead = 12, kFrameHead = 16;
+constexpr uint64_t kFileHead = 12;
 constexpr uint8_t kClearAfterwards = 1, kReplace = 2;  // flags of a frame: what becomes of it, and how it is put there
 constexpr size_t kMostFrames = 1 << 16;
 constexpr int kLossy = 1, kLossless = 2;              // WebPBitstreamFeatures::format
