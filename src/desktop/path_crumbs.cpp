@@ -30,7 +30,7 @@ std::vector<std::string> Completions(const std::string& typed, const std::vector
   for (const std::string& name : names) {
     if (EqualIgnoringCase(std::string_view(name).substr(0, begun.size()), begun)) paths.push_back(folder + name);
   }
-  std::ranges::stable_partition(paths, [&](const std::string& path) { return path.starts_with(typed); });
+  std::stable_partition(paths.begin(), paths.end(), [&](const std::string& path) { return path.starts_with(typed); });
   return paths;
 }
 

@@ -162,7 +162,7 @@ std::vector<std::string> UserVolumesAmong(const std::vector<Mount>& mounts) {
     if (std::ranges::any_of(kFolders, holds)) places.push_back(mount.place);
   }
   std::ranges::sort(places);
-  places.erase(std::ranges::unique(places).begin(), places.end());
+  places.erase(std::unique(places.begin(), places.end()), places.end());
   return places;
 }
 
