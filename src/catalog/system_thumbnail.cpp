@@ -19,11 +19,19 @@ namespace {
 constexpr std::string_view kUriKey = "Thumb::URI", kTimeKey = "Thumb::MTime";
 constexpr std::string_view kAllowedMarks = "-_.!~*'():@&=+$,/";
 
-std::string CachedFile(std::string_view uri) {
+// The folders of the cache and the longest side of what lies in them.
+struct CacheFolder {
+  const char* name;
+  int32_t side;
+};
+constexpr CacheFolder kCacheFolders[] = {{"large", 256}, {"x-large", 512}, {"xx-large", 1024}};
+
+std::string CachedFile(const CacheFolder& folder, std::string_view uri) {
   const std::string cache = platform::SpecialFolderPath(platform::SpecialFolder::Cache);
   if (cache.empty()) return {};
   const std::span bytes(reinterpret_cast<const uint8_t*>(uri.data()), uri.size());
-  return platform::JoinFolder(platform::JoinFolder(platform::JoinFolder(cache, "thumbnails"), "large"), Md5Text(bytes) + ".png");
+  return platform::JoinFolder(platform::JoinFolder(platform::JoinFolder(cache, "thumbnails"), folder.name),
+                              Md5Text(bytes) + ".png");
 }
 
 // The value of a text chunk with that key.
@@ -46,6 +54,19 @@ bool IsOf(std::span<const uint8_t> file, std::string_view uri, int64_t modified)
   return savedUri == uri && ParseNumber<int64_t>(savedTime) == modified;
 }
 
+PicturePointer ReadCached(const std::string& picturePath, const CacheFolder& folder) {
+  const platform::FileFacts facts = platform::FactsOf(picturePath);
+  if (facts.kind != platform::FileKind::Regular) return nullptr;
+  const std::string uri = FileUri(platform::AbsolutePath(picturePath));
+  const std::string path = CachedFile(folder, uri);
+  platform::FileView file;
+  if (path.empty() || !file.Open(path) || !IsOf(file.Bytes(), uri, facts.modified)) return nullptr;
+  PicturePointer picture = NewPictureRecord();
+  if (picture == nullptr || DescribePng(file.Bytes(), *picture) != Status::Ok) return nullptr;
+  if (std::max(picture->width, picture->height) > folder.side) return nullptr;
+  return DecodePng(file.Bytes(), *picture) == Status::Ok ? std::move(picture) : nullptr;
+}
+
 }  // namespace
 
 std::string FileUri(std::string_view path) {
@@ -64,21 +85,16 @@ std::string FileUri(std::string_view path) {
   return uri;
 }
 
-PicturePointer ReadSystemPicture(const std::string& picturePath) {
-  const platform::FileFacts facts = platform::FactsOf(picturePath);
-  if (facts.kind != platform::FileKind::Regular) return nullptr;
-  const std::string uri = FileUri(platform::AbsolutePath(picturePath));
-  const std::string path = CachedFile(uri);
-  platform::FileView file;
-  if (path.empty() || !file.Open(path) || !IsOf(file.Bytes(), uri, facts.modified)) return nullptr;
-  PicturePointer picture = NewPictureRecord();
-  if (picture == nullptr || DescribePng(file.Bytes(), *picture) != Status::Ok) return nullptr;
-  if (std::max(picture->width, picture->height) > kSystemThumbnailSide) return nullptr;
-  return DecodePng(file.Bytes(), *picture) == Status::Ok ? std::move(picture) : nullptr;
+PicturePointer ReadSystemPicture(const std::string& picturePath, int32_t side) {
+  for (const CacheFolder& folder : kCacheFolders) {
+    PicturePointer picture = folder.side >= side ? ReadCached(picturePath, folder) : nullptr;
+    if (picture != nullptr) return picture;
+  }
+  return nullptr;
 }
 
 bool ReadSystemThumbnail(const std::string& picturePath, LargeThumbnailRecord& record) {
-  const PicturePointer picture = ReadSystemPicture(picturePath);
+  const PicturePointer picture = ReadCached(picturePath, kCacheFolders[0]);
   return picture != nullptr && MakeLargeThumbnailRecord(record, *picture);
 }
 

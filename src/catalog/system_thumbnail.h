@@ -15,10 +15,9 @@ namespace fotomill {
 // The address of an absolute path, every byte escaped that RFC 2396 does not allow in one.
 std::string FileUri(std::string_view path);
 
-inline constexpr int32_t kSystemThumbnailSide = 256;
-
-// The system's thumbnail of a picture as a record of its own, null when there is none that is valid.
-PicturePointer ReadSystemPicture(const std::string& picturePath);
+// The system's thumbnail of a picture as a record of its own, from the first of these folders and of "x-large" and "xx-large" (512
+// and 1024 pixels) that is made for `side` pixels at least. Null when there is none that is valid.
+PicturePointer ReadSystemPicture(const std::string& picturePath, int32_t side);
 
 // Fills a large record with the system's thumbnail of a picture. False when there is none that is valid; `record` is
 // then as before.

@@ -119,9 +119,9 @@ Status PixelsOfPicture(PictureRecord& picture, int32_t side, RgbImage& pixels) {
 bool TakeReady(const ThumbnailWish& wish, Thumbnail& thumbnail) {
   ThumbnailRecord record;
   if (FindRecord(wish, record) && PixelsOfRecord(record, wish.side, thumbnail.pixels) == Status::Ok) return true;
-  const bool fromSystem = wish.mode == choice::kDiskBased && settings.UseWindowsThumbnailCache != 0 &&
-                          wish.side > kSmallThumbnailSide && wish.side <= kSystemThumbnailSide;
-  const PicturePointer picture = fromSystem ? ReadSystemPicture(wish.path) : nullptr;
+  const bool fromSystem =
+      wish.mode == choice::kDiskBased && settings.UseWindowsThumbnailCache != 0 && wish.side > kSmallThumbnailSide;
+  const PicturePointer picture = fromSystem ? ReadSystemPicture(wish.path, wish.side) : nullptr;
   return picture != nullptr && PixelsOfPicture(*picture, wish.side, thumbnail.pixels) == Status::Ok;
 }
 

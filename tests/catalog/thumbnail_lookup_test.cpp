@@ -193,6 +193,11 @@ TEST_F(Lookup, TakesTheSystemsThumbnailWhileItIsValid) {
   // 176 x 88 in the middle: rows 44 to 131.
   EXPECT_THAT(record.StoredRow(43).first(3), testing::ElementsAre(0xab, 0xcd, 0xef));
   EXPECT_THAT(record.StoredRow(44).first(3), testing::Not(testing::ElementsAre(0xab, 0xcd, 0xef)));
+  // Screens with more pixels ask for more.
+  EXPECT_NE(ReadSystemPicture(picture_, 256), nullptr);
+  EXPECT_EQ(ReadSystemPicture(picture_, 257), nullptr);
+  std::filesystem::copy(folder_.Path("cache/thumbnails/large"), folder_.Path("cache/thumbnails/x-large"));
+  EXPECT_NE(ReadSystemPicture(picture_, 257), nullptr);
   PutSystemThumbnail(0, FileUri(picture_), 100);
   ASSERT_TRUE(ReadSystemThumbnail(picture_, record));
   EXPECT_THAT(record.StoredRow(38).subspan(37 * 3, 3), testing::ElementsAre(0xab, 0xcd, 0xef));
