@@ -285,6 +285,31 @@ TEST(ThumbnailLoader, ForgetsWhatIsNoLongerWanted) {
   EXPECT_GT(wakes, 0);
 }
 
+TEST(ThumbnailLoader, AReadyThumbnailIsLoadedOnce) {
+  static std::atomic<int> calls;
+  static std::atomic<bool> idle;
+  const auto load = [](const ThumbnailWish& wish) {
+    ++calls;
+    auto thumbnail = std::make_shared<Thumbnail>();
+    thumbnail->standIn = wish.standIn && wish.path == "embedded";
+    return ThumbnailPointer(wish.standIn && wish.path == "none" ? nullptr : thumbnail);
+  };
+  ThumbnailLoader loader(
+      1, [] {}, load, [] { idle = true; });
+  std::vector<ThumbnailWish> wishes;
+  for (const bool standIn : {true, false}) {
+    for (const char* path : {"ready", "embedded", "none"}) wishes.push_back({path, 1, 2, 96, 0, standIn});
+  }
+  loader.Want(wishes);
+  while (!idle) std::this_thread::yield();
+  EXPECT_EQ(calls, 5);
+  std::string order;
+  for (const auto& result : loader.TakeResults()) {
+    order += result.wish.path + (result.wish.standIn ? "?" : "") + (result.thumbnail == nullptr ? "- " : " ");
+  }
+  EXPECT_EQ(order, "ready embedded? none?- embedded none ");
+}
+
 TEST(ThumbnailCache, KeepsTheLastUsedWithinItsBytes) {
   const auto picture = [] {
     auto thumbnail = std::make_shared<Thumbnail>();

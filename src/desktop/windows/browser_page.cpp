@@ -240,7 +240,7 @@ void BrowserPage::ShowAs(const FolderView& view) {
 // What the user chooses is kept for this folder, and goes for folders of which nothing is kept.
 void BrowserPage::ChooseView(const FolderView& view) {
   base_ = view;
-  host_.Views().Keep(model_.Folder(), view);
+  host_.KeepView(model_.Folder(), view);
   ShowAs(view);
 }
 

@@ -28,7 +28,8 @@ class BrowserHost {
   virtual ~BrowserHost() = default;
   virtual void BrowserChanged() = 0;     // folder, selection, modes or counts
   virtual DetailColumns& Columns() = 0;  // of the details of all browsers
-  virtual FolderViews& Views() = 0;      // how folders are to be shown
+  virtual void KeepView(const std::string& folder, const FolderView& view) = 0;
+  virtual const FolderViews& Views() = 0;  // how folders are to be shown
   virtual void ViewFile(const std::string& path) = 0;
   virtual void ShowContextMenu(wxWindow& window, const wxPoint& place, bool onFile) = 0;
   virtual void RenameFile(const std::string& path, const std::string& name) = 0;

@@ -84,7 +84,7 @@ MainFrame::MainFrame()
     event.Skip();
   });
   Bind(
-      wxEVT_TIMER, [this](wxTimerEvent&) { FlushUses(); }, usesTimer_.GetId());
+      wxEVT_TIMER, [this](wxTimerEvent&) { FlushUses(), (void)views_.Save(); }, usesTimer_.GetId());
 }
 
 MainFrame::~MainFrame() {
@@ -513,6 +513,11 @@ void MainFrame::FilesChanged() {
 void MainFrame::NoteUses(const std::vector<FileUse>& uses) {
   uses_.insert(uses_.end(), uses.begin(), uses.end());
   if (!uses.empty()) usesTimer_.StartOnce(kHistoryMs);
+}
+
+void MainFrame::KeepView(const std::string& folder, const FolderView& view) {
+  views_.Keep(folder, view);
+  usesTimer_.StartOnce(kHistoryMs);
 }
 
 void MainFrame::FlushUses() {

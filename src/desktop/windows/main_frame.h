@@ -82,7 +82,8 @@ class MainFrame : public wxFrame, public BrowserHost {
   // BrowserHost
   void BrowserChanged() override;
   DetailColumns& Columns() override { return columns_; }
-  FolderViews& Views() override { return views_; }
+  void KeepView(const std::string& folder, const FolderView& view) override;
+  const FolderViews& Views() override { return views_; }
   void ViewFile(const std::string& path) override;
   void ShowContextMenu(wxWindow& window, const wxPoint& place, bool onFile) override;
   void RenameFile(const std::string& path, const std::string& name) override;
