@@ -1,7 +1,5 @@
 #include "desktop/windows/thumbnail_canvas.h"
 
-#include <wx/control.h>
-#include <wx/dcclient.h>
 #include <wx/settings.h>
 #include <wx/textctrl.h>
 
@@ -11,13 +9,10 @@
 
 #include "core/choice_lists.h"
 #include "core/settings.h"
-#include "core/text.h"
 #include "desktop/event_log.h"
-#include "desktop/windows/bitmaps.h"
 #include "desktop/windows/looks.h"
 #include "desktop/windows/screen_reader.h"
 #include "desktop/windows/wx_text.h"
-#include "picture/registry.h"
 #include "platform/clock.h"
 #include "platform/paths.h"
 
@@ -133,7 +128,7 @@ void ThumbnailCanvas::WantThumbnails() {
     const int height = GetClientSize().y;
     const CellLayout::Range visible = layout_.Visible(scroll_);
     want(visible.first, visible.end);
-    const std::vector<ThumbnailWish> standIns = StandInsFor(wishes);
+    const std::vector<ThumbnailWish> standIns = StandInsFor(visible);
     const int64_t ahead = direction_ > 0 ? scroll_ + height : std::max<int64_t>(scroll_ - height, 0);
     const CellLayout::Range next = layout_.LinesBetween(ahead, ahead + height);
     if (direction_ > 0) want(std::max(next.first, visible.end), next.end);
@@ -146,11 +141,13 @@ void ThumbnailCanvas::WantThumbnails() {
   thumbnails_.Want(std::move(wishes));
 }
 
-std::vector<ThumbnailWish> ThumbnailCanvas::StandInsFor(const std::vector<ThumbnailWish>& wishes) const {
+std::vector<ThumbnailWish> ThumbnailCanvas::StandInsFor(const CellLayout::Range& lines) const {
   std::vector<ThumbnailWish> standIns;
-  for (const ThumbnailWish& wish : wishes) {
-    if (thumbnails_.FindAny(wish.path) != nullptr || !MayHoldThumbnail(FindFormatByName(wish.path))) continue;
-    standIns.push_back(wish);
+  for (size_t line = lines.first; line < lines.end; ++line) {
+    const FolderItem& item = model_.Line(line);
+    if (item.folder || item.modified == 0 || !MayHoldThumbnail(item.format)) continue;
+    if (thumbnails_.FindAny(model_.PathOfLine(line)) != nullptr) continue;
+    standIns.push_back(WishOf(line));
     standIns.back().standIn = true;
   }
   return standIns;

@@ -70,7 +70,7 @@ class ThumbnailCanvas : public wxWindow {
   wxString CutName(wxDC& dc, const std::string& name, int width);
   const wxBitmap& BitmapOfThumbnail(const ThumbnailPointer& thumbnail);
   ThumbnailWish WishOf(size_t line) const;
-  std::vector<ThumbnailWish> StandInsFor(const std::vector<ThumbnailWish>& wishes) const;
+  std::vector<ThumbnailWish> StandInsFor(const CellLayout::Range& lines) const;
   size_t LineAt(const wxPoint& point) const;
   void MoveFocus(Step step, const wxKeyEvent& event);
   void TellFocus();
