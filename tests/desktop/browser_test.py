@@ -52,7 +52,10 @@ def open_select_view(folder):
         desktop.settle()
         desktop.key("Up", "Right", "Return")
         desktop.wait(r"open-with Marker$")
+        end = time.monotonic() + 20
         while not (folder / "opened").exists():
+            if time.monotonic() > end:
+                raise Failure("the program was not started")
             time.sleep(0.05)
         # A changed folder shows itself.
         make_pictures(pictures, ["c.bmp"])
