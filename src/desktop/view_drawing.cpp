@@ -47,12 +47,29 @@ struct ColumnPair {
         u(static_cast<int32_t>(column & 0xffff) >> 8) {}
 };
 
-inline uint8_t* DrawPixelBetween(const RowPair& rows, const ColumnPair& at, uint8_t* rgb) {
-  for (int32_t channel = 2; channel >= 0; --channel) {
-    const int32_t left = 3 * at.left + channel, right = 3 * at.right + channel;
-    const int32_t top = rows.upper[left] * (256 - at.u) + rows.upper[right] * at.u;
-    const int32_t bottom = rows.lower[left] * (256 - at.u) + rows.lower[right] * at.u;
-    *rgb++ = static_cast<uint8_t>((top * (256 - rows.v) + bottom * rows.v + 32768) >> 16);
+// A line between two rows of bytes, as 256 times the values, for the columns that positions need. Whole rows are quick to blend.
+class LineBetween {
+ public:
+  void Set(const RowPair& rows, const Positions& columns, int32_t width, int32_t channels) {
+    channels_ = channels;
+    first_ = channels * static_cast<int32_t>(columns.front() >> 16);
+    const int32_t end = channels * std::min(static_cast<int32_t>(columns.back() >> 16) + 2, width);
+    sums_.resize(static_cast<size_t>(end - first_));
+    for (int32_t i = first_; i < end; ++i) {
+      sums_[static_cast<size_t>(i - first_)] = static_cast<uint16_t>(rows.upper[i] * (256 - rows.v) + rows.lower[i] * rows.v);
+    }
+  }
+  const uint16_t* At(int32_t column) const { return sums_.data() + (channels_ * column - first_); }
+
+ private:
+  std::vector<uint16_t> sums_;
+  int32_t channels_ = 0, first_ = 0;
+};
+
+inline uint8_t* DrawPixelBetween(const LineBetween& line, const ColumnPair& at, uint8_t* rgb) {
+  const uint16_t *left = line.At(at.left), *right = line.At(at.right);
+  for (int channel = 2; channel >= 0; --channel) {
+    *rgb++ = static_cast<uint8_t>((left[channel] * (256 - at.u) + right[channel] * at.u + 32768) >> 16);
   }
   return rgb;
 }
@@ -76,27 +93,42 @@ uint8_t* BlendPixelBetween(const RowPair& rows, const RowPair& alphas, const Col
   return rgb;
 }
 
-// One line between four pixels each.
-void DrawBetween(const PackedImage& image, const Positions& columns, int64_t row, uint8_t* rgb) {
-  const RowPair rows(image, row);
-  for (const int64_t column : columns) rgb = DrawPixelBetween(rows, ColumnPair(column, image.Width()), rgb);
-}
+// Draws lines between four pixels each.
+class BetweenPixels {
+ public:
+  BetweenPixels(const ViewSource& source, const Positions& columns) : source_(source), columns_(columns) {}
 
-void BlendBetween(const ViewSource& source, const Positions& columns, int64_t row, const uint8_t* behind, uint8_t* rgb) {
-  const RowPair rows(source.image, row), alphas(source.alpha, row);
-  for (const int64_t column : columns) {
-    const ColumnPair at(column, source.image.Width());
-    const int32_t alpha = alphas.upper[at.left] + alphas.upper[at.right] + alphas.lower[at.left] + alphas.lower[at.right];
-    if (alpha == 0) {
-      rgb = std::copy_n(behind, 3, rgb);
-    } else if (alpha == 4 * 255) {
-      rgb = DrawPixelBetween(rows, at, rgb);
-    } else {
-      rgb = BlendPixelBetween(rows, alphas, at, behind, rgb);
-    }
-    behind += 3;
+  void Draw(int64_t row, uint8_t* rgb) {
+    const int32_t width = source_.image.Width();
+    colours_.Set(RowPair(source_.image, row), columns_, width, 3);
+    for (const int64_t column : columns_) rgb = DrawPixelBetween(colours_, ColumnPair(column, width), rgb);
   }
-}
+
+  void Blend(int64_t row, const uint8_t* behind, uint8_t* rgb) {
+    constexpr uint16_t kOpaque = 255 * 256;
+    const int32_t width = source_.image.Width();
+    const RowPair rows(source_.image, row), alphaRows(source_.alpha, row);
+    colours_.Set(rows, columns_, width, 3);
+    alphas_.Set(alphaRows, columns_, width, 1);
+    for (const int64_t column : columns_) {
+      const ColumnPair at(column, width);
+      const uint16_t left = *alphas_.At(at.left), right = *alphas_.At(at.right);
+      if (left == kOpaque && right == kOpaque) {
+        rgb = DrawPixelBetween(colours_, at, rgb);
+      } else if (left == 0 && right == 0) {
+        rgb = std::copy_n(behind, 3, rgb);
+      } else {
+        rgb = BlendPixelBetween(rows, alphaRows, at, behind, rgb);
+      }
+      behind += 3;
+    }
+  }
+
+ private:
+  const ViewSource source_;
+  const Positions& columns_;
+  LineBetween colours_, alphas_;
+};
 
 void DrawNearest(const uint8_t* bgr, const Positions& columns, uint8_t* rgb) {
   for (const int64_t column : columns) {
@@ -147,15 +179,16 @@ void DrawView(const ViewSource& source, const ViewTransform& transform, const Ba
   const auto columns = PositionsOf(left - x, right - left, transform.ShownWidth(), image.Width(), between);
   const auto rows = PositionsOf(top - y, bottom - top, transform.ShownHeight(), image.Height(), between);
   const RowsBehind behind(backdrop, left, opaque ? 0 : right - left);
+  BetweenPixels pixels(source, columns);
   for (int32_t line = top; line < bottom; ++line) {
     uint8_t* const rgb = canvas.Row(line) + 3 * left;
     const int64_t row = rows[static_cast<size_t>(line - top)];
     const int32_t nearest = static_cast<int32_t>(row >> 16);
     const uint8_t* const bgr = image.Row(nearest).data();
     if (between && opaque) {
-      DrawBetween(image, columns, row, rgb);
+      pixels.Draw(row, rgb);
     } else if (between) {
-      BlendBetween(source, columns, row, behind.Row(line), rgb);
+      pixels.Blend(row, behind.Row(line), rgb);
     } else if (!opaque) {
       BlendNearest(bgr, source.alpha.Row(nearest).data(), columns, behind.Row(line), rgb);
     } else if (same) {

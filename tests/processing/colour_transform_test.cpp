@@ -136,7 +136,7 @@ TEST(ColourTransform, HostileProfilesDoNoHarm) {
   for (size_t cut = 0; cut < wide.size(); cut += 7) ColourTransform({wide.data(), cut}).Apply(picture->image);
   for (size_t place = 0; place < wide.size(); place += 3) {
     std::vector<uint8_t> damaged = wide;
-    damaged[place] ^= place % 2 == 0 ? 0xff : 0x55;
+    damaged[place] = static_cast<uint8_t>(damaged[place] ^ (place % 2 == 0 ? 0xff : 0x55));
     ColourTransform(damaged, wide).Apply(picture->image);
     ColourTransform(wide, damaged).Apply(picture->image);
   }
