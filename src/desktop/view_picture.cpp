@@ -30,6 +30,17 @@ Status Shrink(const PictureRecord& picture, int32_t width, int32_t height, ViewP
   return ScaleFiltered(picture.image, picture.alpha, {width, height}, ShrinkFilter(), shrunk.image, shrunk.alpha);
 }
 
+// The transform of the profile that this thread met last: pictures of a folder and frames of an animation mostly share theirs.
+const ColourTransform& TransformOf(const std::vector<uint8_t>& profile) {
+  thread_local std::vector<uint8_t> last;
+  thread_local std::unique_ptr<ColourTransform> transform;
+  if (transform == nullptr || profile != last) {
+    transform = std::make_unique<ColourTransform>(profile, screenProfile);
+    last = profile;
+  }
+  return *transform;
+}
+
 Status LoadInto(const ViewWish& wish, ViewPicture& view) {
   PicturePointer picture;
   RETURN_IF_BAD(LoadPictureInfo(wish.path.c_str(), picture));
@@ -55,7 +66,7 @@ Status PrepareView(PicturePointer picture, ViewPicture& view) {
   const ViewWish& wish = view.wish;
   // Before the background joins in, whose colour is the screen's.
   const bool profiles = !picture->metadata.icc.empty() || !screenProfile.empty();
-  if (wish.look.profiles && profiles) ColourTransform(picture->metadata.icc, screenProfile).Apply(picture->image);
+  if (wish.look.profiles && profiles) TransformOf(picture->metadata.icc).Apply(picture->image);
   if (wish.look.keepAlpha) {
     RETURN_IF_BAD(PrepareWithAlpha(*picture));
   } else {
