@@ -218,6 +218,7 @@ def play_animation(folder):
     (folder / "home/.config/gtk-3.0/settings.ini").write_text("[Settings]\ngtk-enable-animations=0\n")
     with Desktop(folder, pictures / "a.gif") as desktop:
         desktop.wait(r"view-frame frame 1 of 5, paused")
+        desktop.wait(r"painted-files")  # the frame comes behind the picture, and would take the keyboard
         desktop.focus("View")
         desktop.key("space")
         desktop.wait(r"view-frame frame 2 of 5$")
