@@ -13,6 +13,7 @@
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "platform/temporary_file.h"
+#include "platform/unchanged_file.h"
 
 namespace fotomill {
 
@@ -72,6 +73,7 @@ class Turning {
   }
 
   Status Turn() {
+    facts_ = platform::FactsOf(source_);
     PicturePointer picture;
     if (const Status status = LoadPictureInfo(source_.c_str(), picture); status != Status::Ok) {
       return Fail(status, OpenHint(source_, status));
@@ -130,6 +132,7 @@ class Turning {
                       metadata.icc == back->metadata.icc;
     if (!LookTheSame(picture, *back)) return Fail(Status::UnsuitableImage, "Its format would change its colors.");
     if (!kept) return Fail(Status::UnsuitableImage, "Its EXIF, XMP or color profile would be lost.");
+    if (picture.comment != back->comment) return Fail(Status::UnsuitableImage, "Its comment would be lost.");
     platform::FileView file;
     if (!file.Open(working.Path())) return Status::FileOpenError;
     return WriteUnlessThere(file.Bytes(), false);
@@ -141,7 +144,14 @@ class Turning {
     ByteWriter out;
     if (!out.Create(destination_)) return Fail(Status::ErrorCreatingFile, "\"" + destination_ + "\" cannot be made.");
     out.Bytes(bytes);
-    RETURN_IF_BAD(CommitOutput(out, options_));
+    WriteOptions options = options_;
+    bool unchanged = true;  // what somebody else has written meanwhile stays
+    options.makeWay = [&] {
+      return (!options_.makeWay || options_.makeWay()) && (unchanged = platform::IsUnchanged(source_, facts_));
+    };
+    const Status status = CommitOutput(out, options);
+    if (!unchanged) return Fail(Status::FileReadError, "It was changed meanwhile.");
+    RETURN_IF_BAD(status);
     result_.changed = true;
     return Status::Ok;
   }
@@ -149,6 +159,7 @@ class Turning {
   const std::string &source_, &destination_;
   const TurnRequest& request_;
   const WriteOptions& options_;
+  platform::FileFacts facts_;  // of the source when it was not read yet
   TurnedFile result_;
 };
 

@@ -106,6 +106,7 @@ class TurnBatch {
     } else {
       turned = TurnPictureFile(outcome.source, outcome.destination, function_.request, options);
     }
+    if (turned.changed && function_.inPlace && function_.replaced) function_.replaced(outcome.source);
     outcome.status = turned.status;
     outcome.hint = kept ? turned.hint : std::string("There is no room to keep the old file for undo.");
     outcome.note = turned.note;

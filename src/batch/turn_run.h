@@ -19,6 +19,7 @@ struct TurnFunction {
   bool dryRun = false;    // nothing is written
   // Called on any thread before a file is replaced in its place; false: it stays, as it could not be kept for later.
   std::function<bool(const std::string& path)> keepPrevious = {};
+  std::function<void(const std::string& path)> replaced = {};  // called likewise as soon as that was done
 };
 
 // Turns a selection: opens the job's progress box, reports every file in selection order, finishes the box. Ok, or

@@ -10,6 +10,7 @@
 #include "platform/clock.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
+#include "platform/unchanged_file.h"
 
 namespace fotomill::desktop {
 
@@ -25,34 +26,34 @@ std::vector<platform::FolderEntry> EntriesOf(const std::string& folder) {
   return platform::ListFolder(folder).value_or(std::vector<platform::FolderEntry>());
 }
 
-bool SameFile(const platform::FileFacts& a, const platform::FileFacts& b) {
-  return a.identity == b.identity && a.device == b.device && a.size == b.size && a.modified == b.modified;
-}
-
 }  // namespace
 
 bool PreviousFile::Keep(const std::string& path) { return kept_.Keep(path, KeptFolder()); }
 
-bool PreviousFile::HasChanged(const std::string& path) const { return !SameFile(platform::FactsOf(path), replaced_); }
+bool PreviousFile::HasChanged(const std::string& path) const { return !platform::IsUnchanged(path, replaced_); }
 
 bool PreviousFiles::Keep(const std::string& path) {
   auto file = std::make_shared<PreviousFile>();
   if (!file->Keep(path)) return false;
-  file->Replaced(path);
   DropThumbnails(platform::AbsolutePath(path));
   const std::lock_guard lock(mutex_);
-  return files_.emplace(platform::AbsolutePath(path), std::move(file)).second;
+  return kept_.emplace(platform::AbsolutePath(path), std::move(file)).second;
+}
+
+void PreviousFiles::Replaced(const std::string& path) {
+  const std::lock_guard lock(mutex_);
+  const auto kept = kept_.find(platform::AbsolutePath(path));
+  if (kept == kept_.end()) return;
+  kept->second->Replaced(path);
+  replaced_.insert(kept_.extract(kept));
 }
 
 FileDeed PreviousFiles::Deed() {
   const std::lock_guard lock(mutex_);
   FileDeed deed{DeedKind::Turn, {}};
-  for (auto& [path, file] : files_) {
-    if (!file->HasChanged(path)) continue;  // it was not replaced after all
-    file->Replaced(path);
-    deed.steps.push_back({path, {}, std::move(file)});
-  }
-  files_.clear();
+  for (auto& [path, file] : replaced_) deed.steps.push_back({path, {}, std::move(file)});
+  replaced_.clear();
+  kept_.clear();
   return deed;
 }
 
@@ -69,12 +70,15 @@ void DeleteOldPreviousFiles() {
 }
 
 DeedResult TurnOneFile(const std::string& path, Orientation turn) {
+  if (platform::FactsOf(path).link)
+    return {{DeedKind::Turn, {}}, {{path, "It is a link and stays; turn the file that it leads to."}}};
   PreviousFiles previous;
   WriteOptions options;
   bool kept = true;
   options.makeWay = [&] { return kept = previous.Keep(path); };
   const TurnRequest request{.turn = turn, .seenByExif = settings.ExifAdjustOrientation != 0};
   const TurnedFile turned = TurnPictureFile(path, path, request, options);
+  if (turned.changed) previous.Replaced(path);
   DeedResult result{previous.Deed(), {}, turned.note};
   if (turned.status != Status::Ok) {
     const std::string hint = kept ? turned.hint : std::string("There is no room to keep the old file for undo.");

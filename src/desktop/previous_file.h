@@ -34,12 +34,14 @@ class PreviousFiles {
  public:
   // To be called before a file is replaced; its thumbnails go. False: it should not be.
   [[nodiscard]] bool Keep(const std::string& path);
-  // The deed of those that were replaced meanwhile, in the order of their paths; they are handed over.
+  // To be called at once when a file that was kept has been replaced; what it becomes later is somebody else's work.
+  void Replaced(const std::string& path);
+  // The deed of those that were replaced, in the order of their paths; they are handed over.
   FileDeed Deed();
 
  private:
   std::mutex mutex_;
-  std::map<std::string, std::shared_ptr<PreviousFile>> files_;
+  std::map<std::string, std::shared_ptr<PreviousFile>> kept_, replaced_;
 };
 
 // Deletes what a program that was killed a month ago or longer left in the data folder.

@@ -21,6 +21,7 @@ constexpr std::string_view kJfifHead("JFIF\0", 5), kJfxxHead("JFXX\0", 5), kMpfH
 constexpr size_t kJfifSize = 14, kJfifAcross = 8, kJfifThumbnail = 12;
 
 bool StandsAlone(uint8_t marker) { return marker == 0x01 || (marker >= 0xD0 && marker <= 0xD8); }
+bool IsExif(const JpegSegment& segment) { return segment.marker == kApp1 && segment.Starts(kExifHead); }
 bool IsApplication(uint8_t marker) { return (marker >= kApp0 && marker <= kApp15) || marker == kComment; }
 
 void Append(std::vector<uint8_t>& bytes, std::span<const uint8_t> more) { bytes.insert(bytes.end(), more.begin(), more.end()); }
@@ -48,9 +49,9 @@ class Assembly {
   void Add(const JpegSegment& segment) {
     const bool jfif = segment.marker == kApp0 && segment.Starts(kJfifHead);
     if (!jfif) AddNew();  // behind JFIF's own, in front of everything else
-    if (segment.marker == kApp1 && segment.Starts(kExifHead) && !parts_.exif.empty()) {
+    if (IsExif(segment) && !parts_.exif.empty() && !exifDone_) {
       Once(exifDone_, kExifHead, parts_.exif);
-    } else if (segment.marker == kApp1 && segment.Starts(kXmpHead) && !parts_.xmp.empty()) {
+    } else if (segment.marker == kApp1 && segment.Starts(kXmpHead) && !parts_.xmp.empty() && !xmpDone_) {
       Once(xmpDone_, kXmpHead, parts_.xmp);
     } else if (!parts_.pixels.empty() && jfif && segment.data.size() >= kJfifSize) {
       AppendJfif(made_, segment.data, parts_.swapSides);
@@ -71,7 +72,7 @@ class Assembly {
 
  private:
   static bool IsOldThumbnail(const JpegSegment& segment) { return segment.marker == kApp0 && segment.Starts(kJfxxHead); }
-  // A second EXIF segment would only repeat the first.
+  // Further segments may hold what has no room in the first; they stay.
   void Once(bool& done, std::string_view heading, std::span<const uint8_t> data) {
     if (!done) AppendSegment(made_, kApp1, heading, data);
     done = true;
@@ -88,7 +89,7 @@ bool JpegSegment::Starts(std::string_view head) const { return ByteReader(data).
 
 std::span<const uint8_t> JpegHead::Exif() const {
   for (const JpegSegment& segment : segments) {
-    if (segment.marker == kApp1 && segment.Starts(kExifHead)) return segment.data.subspan(kExifHead.size());
+    if (IsExif(segment)) return segment.data.subspan(kExifHead.size());
   }
   return {};
 }
@@ -99,6 +100,8 @@ std::span<const uint8_t> JpegHead::Xmp() const {
   }
   return {};
 }
+
+bool JpegHead::HasSplitExif() const { return std::ranges::count_if(segments, IsExif) > 1; }
 
 bool JpegHead::HasMorePictures() const {
   return std::ranges::any_of(segments, [](const JpegSegment& s) { return s.marker == kApp2 && s.Starts(kMpfHead); });

@@ -29,6 +29,8 @@ struct JpegHead {
   // What the first EXIF and XMP segments hold behind their headings; empty when there is none.
   std::span<const uint8_t> Exif() const;
   std::span<const uint8_t> Xmp() const;
+  // Whether EXIF goes on in further segments: then what it points to there must stay where it is.
+  bool HasSplitExif() const;
   // Whether further pictures lie behind the first, with an index of their places (CIPA DC-007, "MPF").
   bool HasMorePictures() const;
 };

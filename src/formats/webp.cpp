@@ -108,11 +108,12 @@ void WalkChunks(std::span<const uint8_t> data, WebpFile& file) {
 Status MeasureFrame(WebpFile& file, WebpFrame& frame) {
   WebPBitstreamFeatures features;
   RETURN_IF_BAD(StatusOf(WebPGetFeatures(frame.pixels.data(), frame.pixels.size(), &features)));
-  frame.width = features.width;
+  const bool inside = int64_t{frame.left} + features.width <= file.width && int64_t{frame.top} + features.height <= file.height;
+  if (!inside || features.has_animation != 0) return Status::DamagedFile;
+  frame.width = features.width;  // only now: a frame that has a size is drawn
   frame.height = features.height;
   file.alpha = file.alpha || features.has_alpha != 0;
-  const bool inside = int64_t{frame.left} + frame.width <= file.width && int64_t{frame.top} + frame.height <= file.height;
-  return inside && features.has_animation == 0 ? Status::Ok : Status::DamagedFile;
+  return Status::Ok;
 }
 
 Status ParseFile(std::span<const uint8_t> data, WebpFile& file) {

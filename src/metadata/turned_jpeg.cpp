@@ -62,8 +62,13 @@ class TurnedFile {
 
  private:
   Status TurnPixels(Orientation wanted, TurnedJpeg& turned) const {
-    if (!head_.HasMorePictures()) return TurnJpeg(file_, wanted, wish_.trim, turned);
-    turned.obstacle = "It holds further pictures, which belong to it as it is.";
+    if (head_.HasMorePictures()) {
+      turned.obstacle = "It holds further pictures, which belong to it as it is.";
+    } else if (head_.HasSplitExif()) {
+      turned.obstacle = "Its EXIF block is too large for one segment.";
+    } else {
+      return TurnJpeg(file_, wanted, wish_.trim, turned);
+    }
     return Status::Ok;
   }
 
@@ -78,6 +83,7 @@ class TurnedFile {
 
   Status WithOrientation(Orientation wanted, std::vector<uint8_t>& made) {
     if (!PutExifOrientation(exif_, static_cast<int32_t>(wanted))) return Status::UnsuitableImage;
+    if (head_.HasSplitExif() && exif_.size() != head_.Exif().size()) return Status::UnsuitableImage;
     SetXmpOrientation(xmp_, static_cast<int32_t>(wanted));
     return AssembleJpeg(file_, head_, {.exif = exif_, .xmp = xmp_}, made);
   }

@@ -122,6 +122,13 @@ TEST(Turn, WhateverFailsTheOldFileIsThere) {
     EXPECT_EQ(folder.Names().size(), 1u);
   });
   EXPECT_GT(faults, 3);
+  WriteOptions options;
+  options.makeWay = [&] {
+    WriteText(path, "somebody's work");
+    return true;
+  };
+  EXPECT_NE(TurnPictureFile(path, path, {.turn = Orientation::HalfTurn}, options).status, Status::Ok);
+  EXPECT_EQ(ReadText(path), "somebody's work");
 }
 
 }  // namespace

@@ -82,6 +82,20 @@ TEST_F(FileDeedsTest, TurnsGiveTheFileBackAndTheirThumbnailsGo) {
   EXPECT_EQ(TakeBack(result.done).failures.size(), 1u);
   EXPECT_EQ(ReadText(path), "somebody's work");
   EXPECT_EQ(TurnOneFile(From("a.png"), Orientation::HalfTurn).failures.size(), 1u);  // no picture
+  std::filesystem::create_symlink("turned.bmp", From("link.bmp"));
+  test::WriteBytes(path, test::BitmapFile(9, 5, 24));
+  EXPECT_EQ(TurnOneFile(From("link.bmp"), Orientation::HalfTurn).failures.size(), 1u);
+  EXPECT_TRUE(std::filesystem::is_symlink(From("link.bmp")));
+  // What comes after a batch has replaced a file, and before it ends, is somebody else's work as well.
+  PreviousFiles batch;
+  ASSERT_TRUE(batch.Keep(path) && batch.Keep(From("b.png")));
+  WriteText(path, "turned");
+  batch.Replaced(path);
+  for (const std::string& file : {path, From("b.png")}) WriteText(file, "somebody's later work");
+  const FileDeed deed = batch.Deed();
+  EXPECT_EQ(deed.steps.size(), 1u);
+  EXPECT_EQ(TakeBack(deed).failures.size(), 1u);
+  EXPECT_EQ(ReadText(path), "somebody's later work");
   SetDataFolder(data);
 }
 

@@ -5,6 +5,7 @@
 #include "core/choice_lists.h"
 #include "core/settings.h"
 #include "formats/jpeg.h"
+#include "formats/jpeg_segments.h"
 #include "metadata/exif_edit.h"
 #include "metadata/exif_walk.h"
 #include "support/codecs.h"
@@ -132,13 +133,17 @@ TEST(TurnedJpeg, WhatBelongsToAPictureTurnsWithIt) {
 
 TEST(TurnedJpeg, UnfitFilesKeepTheirPixels) {
   const Bytes sound = FullFile(64, 48, PatternPicture(32, 24, 24));
-  Bytes flawed = sound, several = sound;
+  Bytes flawed = sound, several = sound, split = sound;
   const auto middle = flawed.begin() + static_cast<std::ptrdiff_t>(flawed.size() - 400);
   middle[0] = 0xFF;
   middle[1] = 0xD9;  // an end in the middle of the scan
   const Bytes index = Hex("FFE20006 4D504600");
   several.insert(several.begin() + 2, index.begin(), index.end());
-  for (const Bytes& file : {flawed, several}) {
+  JpegHead head;
+  ASSERT_EQ(ParseJpegHead(sound, head), Status::Ok);
+  const Bytes second = Hex("FFE1000A 457869660000 0102");  // goes on where the first EXIF segment ends
+  split.insert(split.begin() + static_cast<std::ptrdiff_t>(head.scan), second.begin(), second.end());
+  for (const Bytes& file : {flawed, several, split}) {
     JpegTurnResult result;
     const Bytes made = Turned(file, {.turn = Orientation::HalfTurn}, result);
     EXPECT_EQ(result.way, JpegTurnWay::Tag);

@@ -184,6 +184,7 @@ void TurnSelection(MainFrame& frame, Orientation turn) {
   auto previous = std::make_shared<PreviousFiles>();
   TurnFunction function{.request = {.turn = turn, .seenByExif = settings.ExifAdjustOrientation != 0}, .inPlace = true};
   function.keepPrevious = [previous](const std::string& path) { return previous->Keep(path); };
+  function.replaced = [previous](const std::string& path) { previous->Replaced(path); };
   frame.Batches().Run(
       BatchJob(), [files, function](BatchJob& job) { return RunTurn(files, function, job); }, previous);
 }

@@ -67,10 +67,12 @@ bool TemporaryFile::Create(std::string_view extension) {
 bool TemporaryFile::Keep(const std::string& path, const std::string& folder) {
   Delete();
   if (!IsRegularFile(path) || !MakeFolders(folder)) return false;
+  bool linked = false;
   for (int attempt = 0; attempt < kAttempts; ++attempt) {
     std::string name = JoinFolder(folder, RandomName(".old"));
     if (FaultDue()) return false;
-    if (linkat(AT_FDCWD, path.c_str(), AT_FDCWD, name.c_str(), AT_SYMLINK_FOLLOW) != 0) {
+    linked = linkat(AT_FDCWD, path.c_str(), AT_FDCWD, name.c_str(), AT_SYMLINK_FOLLOW) == 0;
+    if (!linked) {
       if (errno == EEXIST) continue;
       if (!CreateExclusively(name)) return false;
     }
@@ -78,8 +80,8 @@ bool TemporaryFile::Keep(const std::string& path, const std::string& folder) {
     listed_ = EnterTemporaryName(path_);
     break;
   }
+  if (path_.empty() || linked) return linked;
   FileView view;
-  if (path_.empty() || FactsOf(path_).identity == FactsOf(path).identity) return !path_.empty();
   if (view.Open(path) && Write(view.Bytes()) && view.Intact() && CopyTimes(path, path_)) return true;
   Delete();
   return false;
