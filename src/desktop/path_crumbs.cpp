@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <numeric>
 
+#include "core/shown_text.h"
 #include "core/text.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
@@ -28,7 +29,8 @@ std::vector<std::string> Completions(const std::string& typed, const std::vector
   std::vector<std::string> paths;
   if (begun.empty() || std::ranges::find(names, begun) != names.end()) return paths;
   for (const std::string& name : names) {
-    if (EqualIgnoringCase(std::string_view(name).substr(0, begun.size()), begun)) paths.push_back(folder + name);
+    // Other bytes cannot stand in a field for text.
+    if (IsUtf8(name) && EqualIgnoringCase(std::string_view(name).substr(0, begun.size()), begun)) paths.push_back(folder + name);
   }
   std::stable_partition(paths.begin(), paths.end(), [&](const std::string& path) { return path.starts_with(typed); });
   return paths;

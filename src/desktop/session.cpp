@@ -86,7 +86,16 @@ Session LoadSession() {
   const std::string path = DataFile(settings.TabsetCurrentName);
   if (path.empty() || platform::ReadWholeFile(path, kLongestFile, text) != platform::ReadResult::Done) return {};
   Session session = ParseSession(text);
-  std::erase_if(session.tabs, [](const SessionTab& tab) { return !platform::IsFolder(tab.folder); });
+  const size_t front = session.tab;
+  std::vector<SessionTab> there;
+  for (size_t tab = 0; tab < session.tabs.size(); ++tab) {
+    if (platform::IsFolder(session.tabs[tab].folder)) {
+      there.push_back(std::move(session.tabs[tab]));
+    } else if (tab < front) {
+      --session.tab;
+    }
+  }
+  session.tabs = std::move(there);
   session.tab = session.tabs.empty() ? 0 : std::min(session.tab, session.tabs.size() - 1);
   return session;
 }

@@ -121,7 +121,7 @@ TEST(PathBar, CrumbsAndTrail) {
   } const rows[] = {{120, 0}, {119, 1}, {110, 1}, {109, 2}, {0, 2}};
   for (const auto& row : rows) EXPECT_EQ(FirstCrumbShown(widths, row.room, 20), row.first) << row.room;
 
-  const std::vector<std::string> names = {"Sub", "sub1", "sub2", "other"};
+  const std::vector<std::string> names = {"Sub", "sub1", "sub2", "other", "s\xFF"};
   EXPECT_EQ(Completions("/a/s", names), (std::vector<std::string>{"/a/sub1", "/a/sub2", "/a/Sub"}));
   for (const char* complete : {"/a/", "/a/other", "/a/x", ""}) EXPECT_TRUE(Completions(complete, names).empty()) << complete;
 

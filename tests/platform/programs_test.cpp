@@ -38,7 +38,7 @@ TEST(Programs, TheUsersChoiceFirst) {
             "[MIME Cache]\nimage/png=one.desktop;kde-two.desktop;bad.desktop;gone.desktop;\n");
   WriteText(folder.Path("config/mimeapps.list"),
             "[Removed Associations]\nimage/png=bad.desktop;\n[Default Applications]\nimage/png=three.desktop\n");
-  entry("one.desktop", "one --new %f %i");
+  entry("one.desktop", "one --new=%f %i 5%%");
   entry("kde/two.desktop", "two %U");
   entry("three.desktop", "three");
   entry("bad.desktop", "bad");
@@ -51,7 +51,8 @@ TEST(Programs, TheUsersChoiceFirst) {
   EXPECT_EQ(programs[0].name, "three.desktop");
   const Words files = {"/x/a.png", "/x/-b.png"};
   EXPECT_EQ(StartsOf(programs[0], files), (std::vector<Words>{{"three", "/x/a.png"}, {"three", "/x/-b.png"}}));
-  EXPECT_EQ(StartsOf(programs[1], files), (std::vector<Words>{{"one", "--new", "/x/a.png"}, {"one", "--new", "/x/-b.png"}}));
+  EXPECT_EQ(StartsOf(programs[1], files),
+            (std::vector<Words>{{"one", "--new=/x/a.png", "5%"}, {"one", "--new=/x/-b.png", "5%"}}));
   EXPECT_EQ(StartsOf(programs[2], files), (std::vector<Words>{{"two", "/x/a.png", "/x/-b.png"}}));
   EXPECT_TRUE(ProgramsFor("/x/a.unknown").empty());
 }

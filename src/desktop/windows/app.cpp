@@ -71,6 +71,7 @@ class App : public wxApp {
     NameControlsAsTheyCome();
     InstallOverrideBoxes();
     RunFormatStartup();
+    formatsStarted_ = true;
     EnablePlugins();
     DeleteOldPreviousFiles();
     std::vector<uint8_t> screen = ReadScreenProfile();
@@ -100,7 +101,7 @@ class App : public wxApp {
   int OnRun() override { return frame_ == nullptr ? 0 : wxApp::OnRun(); }
 
   int OnExit() override {
-    if (frame_ != nullptr) RunFormatShutdown();
+    if (formatsStarted_) RunFormatShutdown();
     return wxApp::OnExit();
   }
 
@@ -123,6 +124,7 @@ class App : public wxApp {
 
   std::string argument_;  // an absolute path, or empty
   bool newInstance_ = false;
+  bool formatsStarted_ = false;
   wxWeakRef<MainFrame> frame_;
   platform::FirstStart firstStart_;
 };

@@ -21,7 +21,6 @@ constexpr SymbolShape kSymbols[] = {
     {"forward", "<path d='M6 3 L11 8 L6 13'/>"},
     {"up", "<path d='M3 9 L8 4 L13 9 M8 4 V13'/>"},
     {"below", "<path d='M3.5 6 L8 10.5 L12.5 6'/>"},
-    {"refresh", "<path d='M13 8 A5 5 0 1 1 11.3 4.2 M11.5 1.5 V4.5 H8.5'/>"},
     {"folder", "<path d='M1.5 4 V13 H14.5 V5.5 H8 L6.5 3.5 H2 Z'/>"},
     {"home", "<path d='M2 8 L8 2.5 L14 8 M3.5 7 V13.5 H12.5 V7 M6.5 13.5 V9.5 H9.5 V13.5'/>"},
     {"favourite", "<path d='M8 1.8 L9.9 5.9 L14.3 6.4 L11 9.4 L11.9 13.8 L8 11.6 L4.1 13.8 L5 9.4 L1.7 6.4 L6.1 5.9 Z'/>"},
@@ -36,7 +35,6 @@ constexpr SymbolShape kSymbols[] = {
     {"trash", "<path d='M2.5 4.5 H13.5 M6 4.5 V2.5 H10 V4.5 M4 4.5 L4.7 14 H11.3 L12 4.5 M6.7 7 V11.5 M9.3 7 V11.5'/>"},
     {"info", "<circle cx='8' cy='8' r='6.2'/><path d='M8 7.2 V11.5 M8 4.4 V5.4'/>"},
     {"exif", "<path d='M1.5 4.5 H4.5 L6 2.5 H10 L11.5 4.5 H14.5 V13 H1.5 Z'/><circle cx='8' cy='8.5' r='2.6'/>"},
-    {"undo", "<path d='M5.5 3 L2.5 6 L5.5 9 M2.5 6 H10 A3.5 3.5 0 0 1 10 13 H6'/>"},
     {"setup",
      "<path d='M2 4.5 H9 M12.5 4.5 H14 M2 11.5 H4 M7.5 11.5 H14'/><circle cx='10.7' cy='4.5' r='1.8'/><circle cx='5.7' cy='11.5' "
      "r='1.8'/>"},
@@ -45,15 +43,6 @@ constexpr SymbolShape kSymbols[] = {
     {"next", "<path d='M4 3 L11 8 L4 13 Z M12.5 3 V13'/>"},
     {"play", "<path d='M4.5 2.5 L12.5 8 L4.5 13.5 Z' fill='COLOR'/>"},
     {"pause", "<path d='M5 3 V13 M11 3 V13' stroke-width='2.6'/>"},
-    {"fit", "<path d='M2 6 V2.5 H5.5 M10.5 2.5 H14 V6 M14 10 V13.5 H10.5 M5.5 13.5 H2 V10'/>"},
-    {"actual",
-     "<path d='M3 4.5 L4.5 3.5 V12.5 M11.5 4.5 L13 3.5 V12.5'/><circle cx='8.4' cy='6.2' r='0.6'/><circle cx='8.4' cy='10.2' "
-     "r='0.6'/>"},
-    {"zoom-in", "<circle cx='7' cy='7' r='4.7'/><path d='M10.5 10.5 L14.5 14.5 M4.7 7 H9.3 M7 4.7 V9.3'/>"},
-    {"zoom-out", "<circle cx='7' cy='7' r='4.7'/><path d='M10.5 10.5 L14.5 14.5 M4.7 7 H9.3'/>"},
-    {"full", "<path d='M9.5 6.5 L13.5 2.5 M10 2.5 H13.5 V6 M6.5 9.5 L2.5 13.5 M2.5 10 V13.5 H6'/>"},
-    {"left", "<path d='M4 2 V5.5 H7.5 M4.2 5.3 A5.4 5.4 0 1 1 3 10'/>"},
-    {"right", "<path d='M12 2 V5.5 H8.5 M11.8 5.3 A5.4 5.4 0 1 0 13 10'/>"},
 };
 
 std::string HexColor(const wxColour& color) { return std::string(color.GetAsString(wxC2S_HTML_SYNTAX).utf8_str()); }

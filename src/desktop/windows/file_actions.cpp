@@ -108,9 +108,10 @@ void FileActions::Follow(const FileDeed& deed, bool back) {
   for (const FileStep& step : deed.steps) frame_.FollowRename(back ? step.to : step.from, back ? step.from : step.to);
 }
 
-void FileActions::Trash(const std::vector<std::string>& paths) {
+bool FileActions::Trash(const std::vector<std::string>& paths) {
   if (!paths.empty() && !platform::HasTrash(paths.front())) return Delete(paths);
   Do(DeedKind::Trash, paths, {});
+  return true;
 }
 
 bool FileActions::TrashFromView(wxWindow* view, const std::string& path) {
@@ -124,21 +125,21 @@ bool FileActions::TrashFromView(wxWindow* view, const std::string& path) {
     dialog.SetOKLabel("&Delete");
     if (dialog.ShowModal() != wxID_OK) return false;
   }
-  Trash({path});
-  return true;
+  return Trash({path});
 }
 
-void FileActions::Delete(const std::vector<std::string>& paths) {
-  if (paths.empty()) return;
+bool FileActions::Delete(const std::vector<std::string>& paths) {
+  if (paths.empty()) return false;
   const wxString what = paths.size() == 1 ? "\"" + Shown(platform::FileNameOf(paths.front())) + "\"" : Shown(Count(paths.size()));
   const wxString why = platform::HasTrash(paths.front()) ? wxString() : wxString("There is no trash for files of this folder.\n");
   wxMessageDialog dialog(&frame_, why + "Delete " + what + " for good? This cannot be undone.", "Delete",
                          wxOK | wxCANCEL | wxCANCEL_DEFAULT | wxICON_WARNING);
   dialog.SetOKLabel("&Delete");
   LogEvent("prompt", "delete");
-  if (dialog.ShowModal() != wxID_OK) return;
+  if (dialog.ShowModal() != wxID_OK) return false;
   Run(
       "Deletion for good", [paths](const DeedProgress& progress) { return DeleteForGood(paths, progress); }, [](DeedResult) {});
+  return true;
 }
 
 void FileActions::CopyTo(const std::vector<std::string>& paths, const std::string& folder) { Do(DeedKind::Copy, paths, folder); }

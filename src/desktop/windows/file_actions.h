@@ -22,12 +22,13 @@ class FileActions : public wxEvtHandler {
   explicit FileActions(MainFrame& frame);
   ~FileActions() override;
 
-  void Trash(const std::vector<std::string>& paths);
+  // False when the user was asked and does not want it, where there is no trash.
+  bool Trash(const std::vector<std::string>& paths);
   // The same of a file that `view` shows; asks first if PromptDeleteFromView wants it. False when the answer was no, or
   // other files are in work.
   bool TrashFromView(wxWindow* view, const std::string& path);
-  // Asks first.
-  void Delete(const std::vector<std::string>& paths);
+  // Asks first. False when the answer was no.
+  bool Delete(const std::vector<std::string>& paths);
   void CopyTo(const std::vector<std::string>& paths, const std::string& folder);
   void MoveTo(const std::vector<std::string>& paths, const std::string& folder);
   void Rename(const std::string& path, const std::string& name);

@@ -270,12 +270,12 @@ void MainFrame::RestorePlace() {
     SetSize(FromDIP(wxSize(std::max(session.width, 400), std::max(session.height, 300))));
   if (session.maximized) Maximize();
   columns_ = ParseDetailColumns(session.columns);
+  if (settings.RememberOpenWindows != 0) lastTabs_ = session;
 }
 
 bool MainFrame::RestoreTabs() {
-  const Session session = LoadSession();
-  if (settings.RememberOpenWindows == 0 || session.tabs.empty()) return false;
-  OpenTabs(session);
+  if (lastTabs_.tabs.empty()) return false;
+  OpenTabs(std::exchange(lastTabs_, {}));
   return true;
 }
 
@@ -322,6 +322,7 @@ void MainFrame::OpenTabSet() {
     return Tell("The folders of this tab set are not there any more.");
   }
   const size_t old = tabs_->GetPageCount();
+  lastTabs_ = {};
   OpenTabs(session);
   for (size_t tab = 0; tab < old; ++tab) tabs_->DeletePage(0);
   (void)SaveConfiguration();
@@ -340,7 +341,7 @@ bool MainFrame::KeepSession(bool withTabs) {
     session.width = size.x;
     session.height = size.y;
   }
-  session.tab = static_cast<size_t>(std::max(tabs_->GetSelection(), 0));
+  session.tab = Browser() == nullptr ? lastTabs_.tab : static_cast<size_t>(tabs_->GetSelection());
   if (BrowserPage* browser = Browser()) browser->KeepColumns();
   session.columns = DetailColumnsText(columns_);
   for (size_t tab = 0; tab < tabs_->GetPageCount() && withTabs; ++tab) {
@@ -349,6 +350,7 @@ bool MainFrame::KeepSession(bool withTabs) {
     session.tabs.push_back(
         {model.Folder(), model.View(), PageAt(tab)->Scroll(), focus == kNoLine ? std::string() : model.Line(focus).name});
   }
+  if (withTabs) session.tabs.insert(session.tabs.end(), lastTabs_.tabs.begin(), lastTabs_.tabs.end());
   (void)views_.Save();
   return SaveSession(session);
 }

@@ -8,6 +8,7 @@
 
 #include "catalog/file_history.h"
 #include "desktop/favourites.h"
+#include "desktop/session.h"
 #include "desktop/windows/browser_page.h"
 #include "desktop/windows/thumbnail_service.h"
 
@@ -22,7 +23,6 @@ class FileActions;
 class FolderTree;
 class ViewFrame;
 struct Command;
-struct Session;
 
 // The program's window: a tab for each browser, the folders at the left, menus and toolbar from the table of commands.
 class MainFrame : public wxFrame, public BrowserHost {
@@ -41,7 +41,7 @@ class MainFrame : public wxFrame, public BrowserHost {
   BrowserPage* OpenTab(const std::string& folder);
   // The tab that shows the folder, or another one.
   BrowserPage* ShowFolder(const std::string& folder);
-  // Size and place of the last run.
+  // Size and place of the last run; its tabs are opened later.
   void RestorePlace();
   void CloseTab();
   void ReopenTab();
@@ -113,6 +113,7 @@ class MainFrame : public wxFrame, public BrowserHost {
   wxSplitterWindow* splitter_ = nullptr;
   FolderTree* tree_ = nullptr;
   wxAuiNotebook* tabs_ = nullptr;
+  Session lastTabs_;                     // of the last run, as long as they are not open
   std::vector<std::string> closedTabs_;  // folders, the latest last
   std::string loggedState_;
   wxWeakRef<ViewFrame> wantsList_;  // shows a file whose folder is being listed

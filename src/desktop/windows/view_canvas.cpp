@@ -9,6 +9,7 @@
 #include "core/choice_lists.h"
 #include "core/settings.h"
 #include "desktop/event_log.h"
+#include "desktop/palette.h"
 #include "desktop/windows/bitmaps.h"
 #include "desktop/windows/wx_text.h"
 #include "platform/clock.h"
@@ -205,10 +206,12 @@ Backdrop ViewCanvas::BackdropHere() const {
 }
 
 void ViewCanvas::PaintMessage(wxDC& dc) const {
-  dc.SetBackground(wxBrush(ColourOf(settings.ViewModeBackground)));
+  const wxColour around = ColourOf(settings.ViewModeBackground);
+  dc.SetBackground(wxBrush(around));
   dc.Clear();
   if (picture_ == nullptr) return;
-  dc.SetTextForeground(*wxBLACK);
+  const Shade text = Readable({0, 0, 0}, {around.Red(), around.Green(), around.Blue()});
+  dc.SetTextForeground(wxColour(text.red, text.green, text.blue));
   const std::string name(platform::FileNameOf(picture_->wish.path));
   dc.DrawLabel(Shown(name) + "\n" + Shown(StatusMessage(picture_->status)), wxRect(GetClientSize()), wxALIGN_CENTER);
 }

@@ -336,7 +336,16 @@ void ViewFrame::DeleteFile() {
   const std::string path = list_[place_];
   if (!frame_.Files().TrashFromView(this, path)) return;
   loader_->Forget(path);
-  list_.erase(list_.begin() + static_cast<std::ptrdiff_t>(place_));
+  // A slideshow may have gone on while the user was asked.
+  const auto gone = std::ranges::find(list_, path);
+  if (gone == list_.end()) return;
+  const auto place = static_cast<size_t>(gone - list_.begin());
+  list_.erase(gone);
+  if (place != place_) {
+    if (place < place_) --place_;
+    slideshow_.ShownAt(place_, list_.size());
+    return ViewChanged();
+  }
   if (list_.empty()) {
     Close();
     return;
@@ -359,11 +368,12 @@ void ViewFrame::SaveTurned() {
   if (saving_ || turn_ == Orientation::Upright) return SetStatusText("The picture is as its file has it.");
   const std::string path = list_[place_];
   const wxWeakRef<ViewFrame> self(this);
-  saving_ = frame_.Files().SaveTurned(path, turn_, [self](bool done, const std::string& note) {
+  saving_ = frame_.Files().SaveTurned(path, turn_, [self, path](bool done, const std::string& note) {
     if (!self) return;
     self->saving_ = false;
     if (done) self->FilesChanged();
-    self->note_ = note;
+    if (self->list_[self->place_] == path) self->note_ = note;
+    self->ViewChanged();
   });
   SetStatusText(saving_ ? "Saving..." : "Wait until the files before are done.");
 }

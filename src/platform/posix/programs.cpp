@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cstdlib>
+#include <optional>
 #include <string_view>
 
 #include "platform/files.h"
@@ -62,6 +63,25 @@ std::string EntryText(const std::vector<std::string>& folders, std::string name)
   return {};
 }
 
+// A word with its codes replaced, that of the file anywhere in it. `named` when it holds the file, nullopt when nothing is left.
+std::optional<std::string> Expanded(const std::string& word, const std::string& file, bool& named) {
+  std::string text;
+  bool coded = false;
+  for (size_t i = 0; i < word.size(); ++i) {
+    if (word[i] != '%' || i + 1 == word.size()) {
+      text += word[i];
+      continue;
+    }
+    const char code = word[++i];
+    coded = true;
+    if (code == '%') text += code;
+    if (code != 'f' && code != 'u' && code != 'F' && code != 'U') continue;
+    text += file;
+    named = true;
+  }
+  return coded && text.empty() ? std::nullopt : std::optional(text);
+}
+
 }  // namespace
 
 std::vector<Program> ProgramsFor(const std::string& file) {
@@ -102,13 +122,8 @@ std::vector<std::vector<std::string>> StartsOf(const Program& program, const std
       if (word == "%F" || word == "%U") {
         for (const std::string& file : files) arguments.push_back(AbsolutePath(file));
         named = true;
-      } else if (word == "%f" || word == "%u") {
-        arguments.push_back(AbsolutePath(files[i]));
-        named = true;
-      } else if (word == "%%") {
-        arguments.push_back("%");
-      } else if (word.size() != 2 || word[0] != '%') {
-        arguments.push_back(word);
+      } else if (auto expanded = Expanded(word, AbsolutePath(files[i]), named)) {
+        arguments.push_back(std::move(*expanded));
       }
     }
     if (!named) arguments.push_back(AbsolutePath(files[i]));
