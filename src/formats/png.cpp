@@ -436,6 +436,20 @@ void AddChunkLines(std::span<const uint8_t> file, DetailLines& lines) {
   lines.AddFormat("       Chunks: %d, %d of pixels", count, pixels);
 }
 
+// Whether there are texts that somebody wrote, beside those that travel with the picture; programs write the others.
+bool HoldsFurtherTexts(std::span<const uint8_t> file) {
+  constexpr std::string_view kOthers[] = {kPngXmpKeyword, "Comment", "Software", "Creation Time"};
+  PngChunks chunks(file);
+  PngChunk chunk;
+  while (chunks.Next(chunk)) {
+    if (chunk.type != "tEXt" && chunk.type != "zTXt" && chunk.type != "iTXt") continue;
+    const std::string_view text(reinterpret_cast<const char*>(chunk.data.data()), chunk.data.size());
+    const std::string_view key = text.substr(0, text.find('\0'));
+    if (!key.starts_with("date:") && std::ranges::find(kOthers, key) == std::end(kOthers)) return true;
+  }
+  return false;
+}
+
 }  // namespace
 
 Status DescribePng(std::span<const uint8_t> file, PictureRecord& picture) {
@@ -465,7 +479,9 @@ Status PngRead(PictureRecord& picture, const char* fileName) {
   picture.alpha.Free();
   platform::FileView file;
   if (!file.Open(fileName)) return Status::FileOpenError;
-  return DecodePng(file.Bytes(), picture);
+  RETURN_IF_BAD(DecodePng(file.Bytes(), picture));
+  picture.simplified = picture.simplified || HoldsFurtherTexts(file.Bytes());
+  return Status::Ok;
 }
 
 Status PngDetails(PictureRecord& picture) {

@@ -210,6 +210,21 @@ void TakeMetadata(const TiffInput& input, PictureRecord& picture) {
   metadata.dpiY = y * perInch;
 }
 
+// Whether there are tags of weight that a new file would not have: captions, places on the earth, and without a camera's
+// directory those of the author.
+bool HoldsFurtherTags(TIFF* tiff) {
+  constexpr uint32_t kFurther[] = {TIFFTAG_RICHTIFFIPTC, TIFFTAG_PHOTOSHOP, 33550, 33922, 34264, 34735};  // the last: GeoTIFF
+  uint64_t place = 0;
+  const bool camera = TIFFGetField(tiff, TIFFTAG_EXIFIFD, &place) != 0 || TIFFGetField(tiff, TIFFTAG_GPSIFD, &place) != 0;
+  const int count = TIFFGetTagListCount(tiff);
+  for (int i = 0; i < count; ++i) {
+    const uint32_t tag = TIFFGetTagListEntry(tiff, i);
+    if (!camera && (tag == TIFFTAG_ARTIST || tag == TIFFTAG_COPYRIGHT)) return true;
+    if (std::ranges::find(kFurther, tag) != std::end(kFurther)) return true;
+  }
+  return false;
+}
+
 // Opens the page that the record asks for and fills the facts.
 Status Describe(TiffInput& input, TiffLayout& layout, PictureRecord& picture) {
   RETURN_IF_BAD(input.Open());
@@ -223,7 +238,8 @@ Status Describe(TiffInput& input, TiffLayout& layout, PictureRecord& picture) {
   picture.width = static_cast<int32_t>(layout.width);
   picture.height = static_cast<int32_t>(layout.height);
   picture.bitsPerPixel = layout.bitsPerPixel;
-  picture.simplified = layout.form.bits > 8 || layout.colors > 3 || layout.photometric >= PHOTOMETRIC_CIELAB;
+  picture.simplified =
+      layout.form.bits > 8 || layout.colors > 3 || layout.photometric >= PHOTOMETRIC_CIELAB || HoldsFurtherTags(tiff);
   picture.alphaFlags = static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (layout.alpha >= 0 ? kHasAlpha : 0));
   picture.imageBytes = EstimateImageBytes(picture.width, picture.height, picture.bitsPerPixel);
   TakePalette(tiff, layout, picture.palette);

@@ -128,6 +128,14 @@ TEST(Turn, WhateverFailsTheOldFileIsThere) {
     return true;
   };
   EXPECT_NE(TurnPictureFile(path, path, {.turn = Orientation::HalfTurn}, options).status, Status::Ok);
+  // Neither does a text go that a new file would not have.
+  std::vector<uint8_t> written = Encode(PngWrite, *PatternPicture(9, 5, 24));
+  const std::vector<uint8_t> author = Hex("00000009 74455874 417574686F72004D65 00000000");
+  written.insert(written.end() - 12, author.begin(), author.end());
+  const std::string png = folder.Path("a.png");
+  WriteBytes(png, written);
+  EXPECT_EQ(TurnPictureFile(png, png, {.turn = Orientation::HalfTurn}, {}).status, Status::UnsuitableImage);
+  EXPECT_EQ(ReadBytes(png), written);
   EXPECT_EQ(ReadText(path), "somebody's work");
 }
 
