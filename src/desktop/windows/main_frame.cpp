@@ -456,6 +456,12 @@ void MainFrame::OpenStart(const std::string& path, bool restore) {
   view->WhenShown([this, show, folder = platform::AbsolutePath(path + "/.."), weak = wxWeakRef<ViewFrame>(view)] {
     wantsList_ = weak.get();
     show(folder);
+    // The new tab has asked for the keyboard; it stays with the picture.
+    CallAfter([weak] {
+      if (weak == nullptr) return;
+      weak->Raise();
+      weak->Canvas().SetFocus();
+    });
   });
 }
 
