@@ -147,6 +147,7 @@ WINDOWS = [
     ("tools compact", None, "Compact thumbnail database"),
     ("tools clean", r"cleanup orphans=", "Clean up thumbnails"),
     ("tools plug", None, "Plug-ins"),
+    ("tools toolbar", r"prompt toolbar", "Toolbar"),
     ("help manual", r"help ", "Help: .*"),
 ]
 

@@ -9,6 +9,7 @@
 #include "desktop/folder_trail.h"
 #include "desktop/natural_order.h"
 #include "desktop/path_crumbs.h"
+#include "desktop/toolbar_buttons.h"
 
 namespace fotomill::desktop {
 namespace {
@@ -168,6 +169,12 @@ TEST(BrowserModel, TypingFinds) {
   model.SelectMatching("", MatchMode::Only);
   EXPECT_EQ(model.CountText(), "4 files, 600 bytes");
   EXPECT_EQ(model.FocusText(), "ab.png, 1 of 4");
+}
+
+TEST(Toolbar, KeepsOrderAndSetAndTakesNewButtonsIn) {
+  const std::vector<std::string> known{"view", "convert", "info", "setup"};
+  const std::vector<ToolbarButton> expected{{"setup", true}, {"view", false}, {"convert", true}, {"info", true}};
+  EXPECT_EQ(ParseToolbar("setup\r\n-view\ngone\nsetup\n-\nconvert\n", known), expected);
 }
 
 // The system's colours: background, text, highlight and its text.

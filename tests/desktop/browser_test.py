@@ -237,6 +237,19 @@ def later_starts(folder):
         assert later.wait(30) == 0
         desktop.wait(r"browser tabs=2 lines=1 .*listing=0 .*folder=.*other$")
         desktop.focus("Fotomill Professional")
+        # A button is taken out of the toolbar.
+        desktop.key("ctrl+k")
+        desktop.wait(r"finder found=")
+        desktop.focus("^Find command$")
+        desktop.type("tools toolbar")
+        desktop.wait(r"finder found=1$")
+        desktop.key("Return")
+        desktop.wait(r"prompt toolbar")
+        desktop.focus("^Toolbar$")
+        desktop.screenshot("toolbar")
+        desktop.key("space", "alt+o")
+        desktop.wait(r"toolbar convert ")
+        desktop.focus("Fotomill Professional")
         for keys, name in (("ctrl+Tab", "pictures"), ("ctrl+shift+Tab", "other")):
             desktop.key(keys)
             desktop.wait(rf"browser tabs=2 .*folder=.*{name}$")

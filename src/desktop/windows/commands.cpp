@@ -88,6 +88,7 @@ void SaveTabSet(MainFrame& frame) { frame.SaveTabSet(); }
 void OpenTabSet(MainFrame& frame) { frame.OpenTabSet(); }
 void NextTab(MainFrame& frame) { frame.StepTab(1); }
 void PreviousTab(MainFrame& frame) { frame.StepTab(-1); }
+void ChooseToolbar(MainFrame& frame) { frame.ChooseToolbar(); }
 void Quit(MainFrame& frame) { frame.Close(); }
 void ToggleFolders(MainFrame& frame) { frame.ShowFolders(!frame.FoldersShown()); }
 void ReadFoldersAgain(MainFrame& frame) { frame.FilesChanged(); }
@@ -194,6 +195,7 @@ constexpr Command kCommands[] = {
     {kTools, "&Compact database...", "",             "Takes deleted thumbnails out of a thumbnail database.", Needs::Nothing, ShowCompaction},
     {kTools, "Clean up &thumbnails...", "",          "Deletes thumbnail files whose pictures are gone.", Needs::Nothing, ShowCleanUp},
     {kTools, "&Plug-ins...",         "",             "Lists the plug-in formats and opens their settings.", Needs::Nothing, ShowPlugins},
+    {kTools, "Tool&bar...",          "",             "Chooses the buttons of the toolbar and their order.", Needs::Nothing, ChooseToolbar},
     {kTools, nullptr},
     {kTools, "&Setup...",            "Ctrl+,",       "Shows all settings.", Needs::Nothing, ShowSetup, "setup"},
 
@@ -206,5 +208,11 @@ constexpr Command kCommands[] = {
 }  // namespace
 
 std::span<const Command> Commands() { return kCommands; }
+
+const Command* CommandOfSymbol(std::string_view symbol) {
+  const auto has = [symbol](const Command& command) { return command.symbol != nullptr && command.symbol == symbol; };
+  const auto* const found = std::ranges::find_if(kCommands, has);
+  return found == std::end(kCommands) ? nullptr : found;
+}
 
 }  // namespace fotomill::desktop

@@ -3,6 +3,7 @@
 #include <wx/defs.h>
 
 #include <span>
+#include <string_view>
 
 namespace fotomill::desktop {
 
@@ -35,6 +36,8 @@ struct Command {
 };
 
 std::span<const Command> Commands();
+// The command with a button's symbol, null if none.
+const Command* CommandOfSymbol(std::string_view symbol);
 
 // The id of a row's menu item and button.
 inline constexpr int kFirstCommandId = wxID_HIGHEST + 100;

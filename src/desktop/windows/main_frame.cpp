@@ -24,6 +24,7 @@
 #include "desktop/windows/folder_tree.h"
 #include "desktop/windows/open_with.h"
 #include "desktop/windows/tab_set_box.h"
+#include "desktop/windows/toolbar_box.h"
 #include "desktop/windows/view_frame.h"
 #include "desktop/windows/wx_text.h"
 #include "platform/files.h"
@@ -140,22 +141,34 @@ void MainFrame::BuildMenus() {
 }
 
 void MainFrame::BuildToolbar() {
-  wxToolBar* bar = CreateToolBar(wxTB_FLAT | wxTB_HORIZONTAL | wxTB_TEXT | wxTB_NODIVIDER, wxID_ANY, "Functions");
-  for (const Command& command : Commands()) {
-    if (command.symbol == nullptr) continue;
-    wxString label = wxControl::RemoveMnemonics(command.text);
-    label.EndsWith("...", &label);
-    bar->AddTool(CommandId(command), label, Symbol(command.symbol, 20), command.help);
-  }
-  bar->Realize();
+  CreateToolBar(wxTB_FLAT | wxTB_HORIZONTAL | wxTB_TEXT | wxTB_NODIVIDER, wxID_ANY, "Functions");
+  FillToolbar();
   // Symbols are in the colour of texts.
-  Bind(wxEVT_SYS_COLOUR_CHANGED, [this, bar](wxSysColourChangedEvent& event) {
-    for (const Command& command : Commands()) {
-      if (command.symbol != nullptr) bar->SetToolNormalBitmap(CommandId(command), Symbol(command.symbol, 20));
-    }
+  Bind(wxEVT_SYS_COLOUR_CHANGED, [this](wxSysColourChangedEvent& event) {
+    FillToolbar();
     LogEvent("colours", "changed");
     event.Skip();
   });
+}
+
+void MainFrame::FillToolbar() {
+  wxToolBar* const bar = GetToolBar();
+  bar->ClearTools();
+  std::string names;
+  for (const ToolbarButton& button : ToolbarButtons()) {
+    if (!button.shown) continue;
+    const Command& command = *CommandOfSymbol(button.name);
+    wxString label = wxControl::RemoveMnemonics(command.text);
+    label.EndsWith("...", &label);
+    bar->AddTool(CommandId(command), label, Symbol(command.symbol, 20), command.help);
+    names += " " + button.name;
+  }
+  bar->Realize();
+  LogEvent("toolbar", names.empty() ? names : names.substr(1));
+}
+
+void MainFrame::ChooseToolbar() {
+  if (AskForToolbar(*this)) FillToolbar();
 }
 
 // The tip of a button that is grey says why.

@@ -49,6 +49,7 @@ class MainFrame : public wxFrame, public BrowserHost {
   void SaveTabSet();
   void OpenTabSet();
   void StepTab(int step);
+  void ChooseToolbar();
   bool HasClosedTab() const { return !closedTabs_.empty(); }
   void ShowFolders(bool show);
   bool FoldersShown() const;
@@ -94,6 +95,7 @@ class MainFrame : public wxFrame, public BrowserHost {
   bool RestoreTabs();
   void BuildMenus();
   void BuildToolbar();
+  void FillToolbar();
   void BuildPanes();
   void ShowTip(const Command& command);
   bool Enabled(const Command& command) const;
