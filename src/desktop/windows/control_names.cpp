@@ -43,8 +43,8 @@ bool HasOwnName(const wxWindow& window) {
 
 bool ShowsItsText(wxWindow& window) {
   return !window.GetLabel().empty() &&
-         (wxDynamicCast(&window, wxAnyButton) != nullptr || wxDynamicCast(&window, wxCheckBox) != nullptr ||
-          wxDynamicCast(&window, wxRadioButton) != nullptr);
+         (dynamic_cast<wxAnyButton*>(&window) != nullptr || dynamic_cast<wxCheckBox*>(&window) != nullptr ||
+          dynamic_cast<wxRadioButton*>(&window) != nullptr);
 }
 
 wxString PlainText(const wxString& label) {
@@ -55,7 +55,7 @@ wxString PlainText(const wxString& label) {
 
 // The text that was made just before a control, as labels are.
 wxString TextBefore(const wxWindow& window) {
-  const auto* const text = wxDynamicCast(window.GetPrevSibling(), wxStaticText);
+  const auto* const text = dynamic_cast<wxStaticText*>(window.GetPrevSibling());
   return text == nullptr ? wxString() : PlainText(text->GetLabel());
 }
 
@@ -68,14 +68,14 @@ bool IsComposite(wxWindow* window) {
 wxString NameOf(wxWindow& window) {
   if (HasOwnName(window)) return window.GetName();
   if (IsComposite(window.GetParent())) return NameOf(*window.GetParent());
-  if (ShowsItsText(window) || wxDynamicCast(&window, wxControl) == nullptr) return {};
+  if (ShowsItsText(window) || dynamic_cast<wxControl*>(&window) == nullptr) return {};
   const wxString before = TextBefore(window);
   return before.empty() ? window.GetToolTipText().BeforeFirst('\n') : before;
 }
 
 void NameControl(wxWindow& window) {
   // The buttons of toolbars have names already.
-  if (window.IsTopLevel() || wxDynamicCast(&window, wxStaticText) != nullptr || wxDynamicCast(&window, wxToolBar) != nullptr)
+  if (window.IsTopLevel() || dynamic_cast<wxStaticText*>(&window) != nullptr || dynamic_cast<wxToolBar*>(&window) != nullptr)
     return;
   const wxString name = NameOf(window);
   if (!name.empty()) TellScreenReader(window, name);

@@ -402,7 +402,7 @@ void MainFrame::OnTabChanged(wxAuiNotebookEvent& event) {
   const int left = event.GetOldSelection();
   if (left != wxNOT_FOUND && static_cast<size_t>(left) < tabs_->GetPageCount()) PageAt(static_cast<size_t>(left))->KeepColumns();
   for (wxWindow* const window : tabs_->GetChildren()) {
-    if (wxDynamicCast(window, wxAuiTabCtrl) != nullptr) window->SetName("Tabs");
+    if (dynamic_cast<wxAuiTabCtrl*>(window) != nullptr) window->SetName("Tabs");
   }
   if (BrowserPage* browser = Browser()) {
     browser->Activated();
