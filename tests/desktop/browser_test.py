@@ -170,6 +170,13 @@ def compare(folder):
         desktop.wait(r"compare-focus 1/4")
         desktop.wait(r"compare-zoom joined=1 (\d+%) \1 \1")
         desktop.screenshot("compare")
+        # What was written meanwhile is loaded again.
+        with (pictures / "c.jpg").open("ab") as file:
+            file.write(b"more")
+        desktop.focus("Fotomill Professional")
+        desktop.key("F5")
+        desktop.wait(r"compare pane=3/4 status=0 .*c.jpg")
+        desktop.focus("Compare")
         desktop.key("Tab", "Tab", "Delete")
         desktop.wait(r"compare-focus 3/3")
         desktop.wait(r"files Deletion of c.jpg done=1")

@@ -19,6 +19,7 @@
 #include "desktop/windows/main_frame.h"
 #include "desktop/windows/screen_reader.h"
 #include "desktop/windows/wx_text.h"
+#include "platform/files.h"
 #include "platform/paths.h"
 
 namespace fotomill::desktop {
@@ -153,10 +154,17 @@ void CompareFrame::WantPictures() {
 
 void CompareFrame::PicturesCame() {
   for (Pane& pane : panes_) {
-    const ViewPicturePointer& shown = pane.canvas->Picture();
-    if (shown != nullptr && shown->wish.SamePicture(WishOf(pane))) continue;
-    if (const ViewPicturePointer ready = loader_->Find(WishOf(pane))) TakePicture(pane, ready);
+    const ViewPicturePointer ready = loader_->Find(WishOf(pane));
+    if (ready != nullptr && ready != pane.canvas->Picture()) TakePicture(pane, ready);
   }
+}
+
+void CompareFrame::FilesChanged() {
+  for (const Pane& pane : panes_) {
+    const ViewPicturePointer& shown = pane.canvas->Picture();
+    if (shown != nullptr && shown->HasChanged() && platform::IsRegularFile(pane.path)) loader_->Forget(pane.path);
+  }
+  WantPictures();
 }
 
 void CompareFrame::TakePicture(Pane& pane, ViewPicturePointer picture) {

@@ -23,6 +23,8 @@ class CompareFrame : public wxFrame {
   CompareFrame(MainFrame& frame, const std::vector<std::string>& files);
   ~CompareFrame() override;
 
+  // Files were written: panes whose files are others now load them again.
+  void FilesChanged();
   // Commands, by keys and menu.
   ViewCanvas& Canvas() { return *panes_[focus_].canvas; }
   bool Joined() const { return joined_; }

@@ -528,6 +528,7 @@ void MainFrame::FilesChanged() {
   for (size_t tab = 0; tab < tabs_->GetPageCount(); ++tab) PageAt(tab)->Reload();
   for (wxWindow* window : GetChildren()) {
     if (auto* view = dynamic_cast<ViewFrame*>(window)) view->FilesChanged();
+    if (auto* compare = dynamic_cast<CompareFrame*>(window)) compare->FilesChanged();
   }
 }
 
