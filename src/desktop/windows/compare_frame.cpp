@@ -126,9 +126,10 @@ CompareFrame::Pane CompareFrame::BuildPane(const std::string& path) {
 
 void CompareFrame::ArrangePanes() {
   const int count = static_cast<int>(panes_.size());
+  SetSizer(nullptr);  // the old one lets go of its panes
   auto* grid = new wxGridSizer(std::min(count, kAcross), FromDIP(wxSize(kFrameWidth, kFrameWidth)));
   for (const Pane& pane : panes_) grid->Add(pane.panel, wxSizerFlags(1).Expand());
-  SetSizer(grid);  // the old one forgets its panes
+  SetSizer(grid);
   Layout();
   SetTitle(wxString::Format(count == 1 ? "Compare - %d picture" : "Compare - %d pictures", count));
 }
