@@ -2,7 +2,7 @@
 
 #include <cstdint>
 
-#include "picture/registry.h"
+#include "registry/registry.h"
 
 namespace fotomill::bench {
 

@@ -4,9 +4,9 @@
 #include <cmath>
 
 #include "processing/flatten.h"
-#include "processing/orient.h"
-#include "processing/reduce.h"
-#include "processing/scale.h"
+#include "processing/geometry/orient.h"
+#include "processing/geometry/scale.h"
+#include "processing/palette/reduce.h"
 
 namespace fotomill {
 namespace {

@@ -5,8 +5,8 @@
 #include <vector>
 
 #include "core/limits.h"
-#include "metadata/exif_edit.h"
-#include "metadata/exif_walk.h"
+#include "metadata/exif/exif_edit.h"
+#include "metadata/exif/exif_walk.h"
 #include "metadata/gps.h"
 
 namespace {

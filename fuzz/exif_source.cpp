@@ -2,7 +2,7 @@
 
 #include <cstdlib>
 
-#include "metadata/exif_source.h"
+#include "metadata/exif/exif_source.h"
 #include "platform/files.h"
 #include "platform/temporary_file.h"
 

@@ -1,11 +1,11 @@
 #include <string>
 #include <vector>
 
-#include "catalog/file_history.h"
+#include "catalog/history/file_history.h"
 #include "core/data_folder.h"
-#include "core/settings.h"
 #include "platform/clock.h"
 #include "platform/files.h"
+#include "settings/settings.h"
 #include "support/scratch_file.h"
 
 // What was read from a history file is what is read after it was saved, and recording adds one entry in front.

@@ -4,12 +4,12 @@
 #include <utility>
 #include <vector>
 
-#include "core/folder_override.h"
-#include "core/history_list.h"
 #include "core/ini_file.h"
-#include "core/setting_value.h"
-#include "core/settings.h"
-#include "core/spin_range.h"
+#include "settings/folder_override.h"
+#include "settings/history_list.h"
+#include "settings/setting_value.h"
+#include "settings/settings.h"
+#include "settings/spin_range.h"
 
 namespace fotomill {
 namespace {

@@ -1,5 +1,5 @@
-#include "formats/jpeg_segments.h"
-#include "metadata/turned_jpeg.h"
+#include "containers/jpeg_segments.h"
+#include "files/turned_jpeg.h"
 #include "support/codec_target.h"
 #include "support/scratch_file.h"
 

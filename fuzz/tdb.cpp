@@ -2,7 +2,7 @@
 #include <cstring>
 #include <vector>
 
-#include "catalog/thumbnail_database.h"
+#include "catalog/thumbnails/thumbnail_database.h"
 #include "platform/files.h"
 #include "support/scratch_file.h"
 

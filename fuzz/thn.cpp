@@ -1,5 +1,5 @@
-#include "catalog/thumbnail_drawing.h"
-#include "catalog/thumbnail_file.h"
+#include "catalog/thumbnails/thumbnail_drawing.h"
+#include "catalog/thumbnails/thumbnail_file.h"
 #include "support/scratch_file.h"
 
 // A thumbnail file reads as a whole record or not at all, and what reads can be drawn and written back.

@@ -6,8 +6,8 @@
 #include <string>
 
 #include "core/limits.h"
-#include "core/settings.h"
-#include "formats/bmp.h"
+#include "formats/bmp/bmp.h"
+#include "settings/settings.h"
 #include "support/scratch_file.h"
 
 namespace fotomill::fuzz {

@@ -3,7 +3,7 @@
 #include <cstddef>
 #include <cstdint>
 
-#include "picture/registry.h"
+#include "registry/registry.h"
 
 namespace fotomill::fuzz {
 

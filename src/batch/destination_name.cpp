@@ -3,11 +3,11 @@
 #include <algorithm>
 
 #include "core/plain_name.h"
-#include "core/settings.h"
 #include "core/text.h"
-#include "picture/registry.h"
 #include "platform/files.h"
 #include "platform/paths.h"
+#include "registry/registry.h"
+#include "settings/settings.h"
 
 namespace fotomill {
 

@@ -2,7 +2,7 @@
 
 #include <algorithm>
 
-#include "core/settings.h"
+#include "settings/settings.h"
 
 namespace fotomill {
 

@@ -5,10 +5,10 @@
 #include <vector>
 
 #include "batch/progress_box.h"
-#include "catalog/file_history.h"
+#include "catalog/history/file_history.h"
 #include "core/fixed_text.h"
 #include "core/status.h"
-#include "picture/registry.h"
+#include "registry/registry.h"
 
 namespace fotomill {
 

@@ -1,8 +1,8 @@
 #include "batch/picture_failure.h"
 
 #include "picture/picture_record.h"
-#include "picture/registry.h"
-#include "picture/signature.h"
+#include "registry/registry.h"
+#include "registry/signature.h"
 
 namespace fotomill {
 

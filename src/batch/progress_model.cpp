@@ -1,6 +1,6 @@
 #include "batch/progress_model.h"
 
-#include "core/settings.h"
+#include "settings/settings.h"
 
 namespace fotomill {
 

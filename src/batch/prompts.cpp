@@ -1,6 +1,6 @@
 #include "batch/prompts.h"
 
-#include "core/configuration.h"
+#include "settings/configuration.h"
 
 namespace fotomill {
 

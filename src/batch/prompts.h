@@ -4,8 +4,8 @@
 #include <string>
 #include <string_view>
 
-#include "core/key_table.h"
 #include "picture/picture_record.h"
+#include "settings/key_table.h"
 
 namespace fotomill {
 

@@ -4,10 +4,10 @@
 #include <utility>
 
 #include "batch/abort.h"
-#include "core/settings.h"
 #include "platform/clock.h"
 #include "platform/folders.h"
 #include "platform/process.h"
+#include "settings/settings.h"
 
 namespace fotomill {
 

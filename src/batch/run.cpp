@@ -11,12 +11,12 @@
 #include "batch/reported_run.h"
 #include "batch/run_names.h"
 #include "core/text.h"
-#include "metadata/picture_exif.h"
-#include "picture/registry.h"
+#include "metadata/exif/picture_exif.h"
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "platform/volumes.h"
-#include "processing/reduce.h"
+#include "processing/palette/reduce.h"
+#include "registry/registry.h"
 
 namespace fotomill {
 

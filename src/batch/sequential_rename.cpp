@@ -5,13 +5,13 @@
 #include <random>
 
 #include "batch/abort.h"
-#include "batch/rename_log.h"
-#include "core/configuration.h"
 #include "core/plain_name.h"
-#include "core/settings.h"
+#include "files/rename_log.h"
 #include "platform/clock.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
+#include "settings/configuration.h"
+#include "settings/settings.h"
 
 namespace fotomill {
 

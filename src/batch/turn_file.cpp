@@ -5,15 +5,15 @@
 
 #include "batch/picture_failure.h"
 #include "core/byte_writer.h"
-#include "formats/jpeg.h"
-#include "metadata/picture_exif.h"
-#include "metadata/turned_jpeg.h"
-#include "picture/registry.h"
+#include "files/turned_jpeg.h"
+#include "formats/jpeg/jpeg.h"
+#include "metadata/exif/picture_exif.h"
 #include "platform/file_view.h"
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "platform/temporary_file.h"
 #include "platform/unchanged_file.h"
+#include "registry/registry.h"
 
 namespace fotomill {
 

@@ -4,7 +4,7 @@
 
 #include "core/status.h"
 #include "picture/write_options.h"
-#include "processing/orient.h"
+#include "processing/geometry/orient.h"
 
 namespace fotomill {
 

@@ -5,8 +5,8 @@
 #include <cmath>
 #include <numbers>
 
-#include "core/settings.h"
 #include "core/text.h"
+#include "settings/settings.h"
 
 namespace fotomill {
 

@@ -5,7 +5,7 @@
 #include <new>
 #include <numeric>
 
-#include "core/settings.h"
+#include "settings/settings.h"
 
 namespace fotomill {
 

@@ -6,9 +6,6 @@
 #include <string>
 #include <vector>
 
-#include "core/key_table.h"
-#include "core/settings.h"
-#include "picture/registry.h"
 #include "platform/file_view.h"
 #include "platform/files.h"
 #include "platform/module_memory.h"
@@ -16,6 +13,9 @@
 #include "platform/temporary_file.h"
 #include "plugins/plugin_bitmap.h"
 #include "plugins/plugin_table.h"
+#include "registry/registry.h"
+#include "settings/key_table.h"
+#include "settings/settings.h"
 
 namespace fotomill {
 

@@ -2,11 +2,11 @@
 
 #include <mutex>
 
-#include "core/settings.h"
 #include "core/text.h"
-#include "picture/registry.h"
 #include "plugins/plugin_bridge.h"
 #include "plugins/plugin_table.h"
+#include "registry/registry.h"
+#include "settings/settings.h"
 
 namespace fotomill {
 

@@ -6,13 +6,13 @@
 #include <vector>
 
 #include "core/ini_file.h"
-#include "core/settings.h"
 #include "core/text.h"
-#include "picture/registry.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
 #include "platform/shared_library.h"
+#include "registry/registry.h"
+#include "settings/settings.h"
 
 namespace fotomill {
 

@@ -5,9 +5,9 @@
 #include <string_view>
 #include <vector>
 
-#include "core/configuration.h"
 #include "core/fixed_text.h"
 #include "plugins/fotomill_plugin.h"
+#include "settings/configuration.h"
 
 namespace fotomill {
 

@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <cstring>
 
-#include "processing/blend.h"
+#include "processing/color/blend.h"
 #include "processing/promote.h"
 
 namespace fotomill {

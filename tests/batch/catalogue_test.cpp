@@ -3,8 +3,8 @@
 
 #include <filesystem>
 
-#include "batch/catalogue_page.h"
-#include "core/settings.h"
+#include "pages/catalogue_page.h"
+#include "settings/settings.h"
 #include "support/bitmaps.h"
 #include "support/files.h"
 #include "support/pictures.h"

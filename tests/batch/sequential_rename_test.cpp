@@ -5,9 +5,9 @@
 
 #include <filesystem>
 
-#include "batch/rename_log.h"
 #include "core/data_folder.h"
-#include "core/settings.h"
+#include "files/rename_log.h"
+#include "settings/settings.h"
 #include "support/files.h"
 #include "support/scoped_settings.h"
 

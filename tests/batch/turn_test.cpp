@@ -4,9 +4,9 @@
 
 #include <filesystem>
 
-#include "formats/jpeg.h"
-#include "formats/png.h"
-#include "formats/webp.h"
+#include "formats/jpeg/jpeg.h"
+#include "formats/png/png.h"
+#include "formats/webp/webp.h"
 #include "platform/files.h"
 #include "support/bitmaps.h"
 #include "support/codecs.h"

@@ -1,10 +1,10 @@
-#include "catalog/file_history.h"
+#include "catalog/history/file_history.h"
 
 #include <gmock/gmock.h>
 #include <signal.h>
 #include <sys/resource.h>
 
-#include "catalog/thumbnail_file.h"
+#include "catalog/thumbnails/thumbnail_file.h"
 #include "core/choice_lists.h"
 #include "core/data_folder.h"
 #include "platform/clock.h"

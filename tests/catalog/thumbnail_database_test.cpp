@@ -1,4 +1,4 @@
-#include "catalog/thumbnail_database.h"
+#include "catalog/thumbnails/thumbnail_database.h"
 
 #include <gmock/gmock.h>
 #include <signal.h>

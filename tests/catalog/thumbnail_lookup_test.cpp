@@ -1,4 +1,4 @@
-#include "catalog/thumbnail_lookup.h"
+#include "catalog/thumbnails/thumbnail_lookup.h"
 
 #include <gmock/gmock.h>
 #include <sys/stat.h>
@@ -6,12 +6,12 @@
 
 #include <memory>
 
-#include "catalog/system_thumbnail.h"
-#include "catalog/thumbnail_database.h"
-#include "catalog/thumbnail_file.h"
+#include "catalog/thumbnails/system_thumbnail.h"
+#include "catalog/thumbnails/thumbnail_database.h"
+#include "catalog/thumbnails/thumbnail_file.h"
 #include "core/md5.h"
-#include "core/settings.h"
-#include "formats/png.h"
+#include "formats/png/png.h"
+#include "settings/settings.h"
 #include "support/bitmaps.h"
 #include "support/codecs.h"
 #include "support/files.h"

@@ -4,9 +4,9 @@
 #include <cmath>
 #include <nlohmann/json.hpp>
 
-#include "catalog/thumbnail_file.h"
-#include "core/settings.h"
-#include "formats/jpeg.h"
+#include "catalog/thumbnails/thumbnail_file.h"
+#include "formats/jpeg/jpeg.h"
+#include "settings/settings.h"
 #include "support/bitmaps.h"
 #include "support/codecs.h"
 #include "support/command_line.h"

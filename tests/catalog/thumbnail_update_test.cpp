@@ -1,10 +1,10 @@
-#include "catalog/thumbnail_update.h"
+#include "catalog/thumbnails/thumbnail_update.h"
 
 #include <gmock/gmock.h>
 
-#include "core/settings.h"
 #include "platform/clock.h"
 #include "platform/volumes.h"
+#include "settings/settings.h"
 #include "support/bitmaps.h"
 #include "support/files.h"
 #include "support/scoped_settings.h"

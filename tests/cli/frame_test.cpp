@@ -1,9 +1,9 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include "cli/command.h"
-#include "cli/commands.h"
-#include "cli/shown_text.h"
+#include "cli/frame/command.h"
+#include "cli/frame/commands.h"
+#include "cli/frame/shown_text.h"
 #include "core/shown_text.h"
 #include "support/command_line.h"
 #include "support/scoped_environment.h"

@@ -1,11 +1,11 @@
 #include <gtest/gtest.h>
 
 #include "core/data_folder.h"
-#include "core/folder_override.h"
-#include "core/history_list.h"
-#include "core/previous_version.h"
-#include "core/settings.h"
 #include "platform/files.h"
+#include "settings/folder_override.h"
+#include "settings/history_list.h"
+#include "settings/previous_version.h"
+#include "settings/settings.h"
 #include "support/faults.h"
 #include "support/files.h"
 #include "support/scoped_settings.h"

@@ -5,8 +5,8 @@
 #include <thread>
 
 #include "core/data_folder.h"
-#include "desktop/animation_player.h"
-#include "desktop/slideshow.h"
+#include "desktop/models/view/animation_player.h"
+#include "desktop/models/view/slideshow.h"
 #include "support/files.h"
 #include "support/hex.h"
 

@@ -1,15 +1,15 @@
-#include "desktop/browser_model.h"
-#include "desktop/palette.h"
+#include "desktop/models/browser/browser_model.h"
+#include "desktop/models/browser/palette.h"
 
 #include <gtest/gtest.h>
 
 #include "core/choice_lists.h"
-#include "desktop/cell_layout.h"
-#include "desktop/detail_columns.h"
-#include "desktop/folder_trail.h"
-#include "desktop/natural_order.h"
-#include "desktop/path_crumbs.h"
-#include "desktop/toolbar_buttons.h"
+#include "core/natural_order.h"
+#include "desktop/models/browser/cell_layout.h"
+#include "desktop/models/browser/detail_columns.h"
+#include "desktop/models/browser/folder_trail.h"
+#include "desktop/models/browser/path_crumbs.h"
+#include "desktop/models/browser/toolbar_buttons.h"
 
 namespace fotomill::desktop {
 namespace {

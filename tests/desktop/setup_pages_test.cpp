@@ -1,4 +1,4 @@
-#include "desktop/setup_pages.h"
+#include "desktop/models/setup/setup_pages.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -7,10 +7,10 @@
 #include <filesystem>
 #include <set>
 
-#include "core/settings.h"
-#include "desktop/override_options.h"
-#include "desktop/setup_help.h"
-#include "picture/registry.h"
+#include "desktop/models/setup/override_options.h"
+#include "desktop/models/setup/setup_help.h"
+#include "registry/registry.h"
+#include "settings/settings.h"
 #include "support/files.h"
 
 namespace fotomill::desktop {

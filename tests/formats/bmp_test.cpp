@@ -1,4 +1,4 @@
-#include "formats/bmp.h"
+#include "formats/bmp/bmp.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>

@@ -1,10 +1,10 @@
-#include "formats/exif_directories.h"
+#include "containers/exif_directories.h"
 
 #include <gtest/gtest.h>
 
-#include "formats/hdp.h"
-#include "formats/tiff.h"
-#include "metadata/exif_source.h"
+#include "formats/hdphoto/hdp.h"
+#include "formats/tiff/tiff.h"
+#include "metadata/exif/exif_source.h"
 #include "support/codecs.h"
 #include "support/exif_blocks.h"
 #include "support/files.h"

@@ -1,4 +1,4 @@
-#include "formats/fits.h"
+#include "formats/fits/fits.h"
 
 #include <gtest/gtest.h>
 

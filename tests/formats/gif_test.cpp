@@ -1,8 +1,8 @@
-#include "formats/gif.h"
+#include "formats/gif/gif.h"
 
 #include <gtest/gtest.h>
 
-#include "core/settings.h"
+#include "settings/settings.h"
 #include "support/codecs.h"
 #include "support/files.h"
 #include "support/hex.h"

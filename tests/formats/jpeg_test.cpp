@@ -1,11 +1,11 @@
-#include "formats/jpeg.h"
+#include "formats/jpeg/jpeg.h"
 
 #include <gtest/gtest.h>
 
 #include <cstdlib>
 
 #include "core/choice_lists.h"
-#include "core/settings.h"
+#include "settings/settings.h"
 #include "support/codecs.h"
 #include "support/files.h"
 #include "support/hex.h"

@@ -1,4 +1,4 @@
-#include "formats/mac.h"
+#include "formats/macpaint/mac.h"
 
 #include <gtest/gtest.h>
 

@@ -1,4 +1,4 @@
-#include "formats/pcx_runs.h"
+#include "formats/pcx/pcx_runs.h"
 
 #include <gtest/gtest.h>
 

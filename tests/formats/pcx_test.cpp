@@ -1,4 +1,4 @@
-#include "formats/pcx.h"
+#include "formats/pcx/pcx.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>

@@ -1,4 +1,4 @@
-#include "formats/png_filter.h"
+#include "formats/png/png_filter.h"
 
 #include <gtest/gtest.h>
 

@@ -1,9 +1,9 @@
-#include "formats/png.h"
+#include "formats/png/png.h"
 
 #include <gtest/gtest.h>
 
-#include "core/settings.h"
 #include "processing/promote.h"
+#include "settings/settings.h"
 #include "support/codecs.h"
 #include "support/files.h"
 #include "support/peers.h"

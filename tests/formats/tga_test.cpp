@@ -1,8 +1,8 @@
-#include "formats/tga.h"
+#include "formats/targa/tga.h"
 
 #include <gtest/gtest.h>
 
-#include "core/settings.h"
+#include "settings/settings.h"
 #include "support/codecs.h"
 #include "support/hex.h"
 #include "support/scoped_settings.h"

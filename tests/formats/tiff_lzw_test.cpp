@@ -1,4 +1,4 @@
-#include "formats/tiff_lzw.h"
+#include "formats/tiff/tiff_lzw.h"
 
 #include <gtest/gtest.h>
 

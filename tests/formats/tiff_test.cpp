@@ -1,9 +1,9 @@
-#include "formats/tiff.h"
+#include "formats/tiff/tiff.h"
 
 #include <gtest/gtest.h>
 
 #include "core/choice_lists.h"
-#include "core/settings.h"
+#include "settings/settings.h"
 #include "support/codecs.h"
 #include "support/files.h"
 #include "support/hex.h"

@@ -1,11 +1,11 @@
-#include "formats/webp.h"
+#include "formats/webp/webp.h"
 
 #include <gtest/gtest.h>
 
 #include <algorithm>
 #include <cstdio>
 
-#include "core/settings.h"
+#include "settings/settings.h"
 #include "support/codecs.h"
 #include "support/files.h"
 #include "support/scoped_settings.h"

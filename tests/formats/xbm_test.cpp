@@ -1,4 +1,4 @@
-#include "formats/xbm.h"
+#include "formats/xbm/xbm.h"
 
 #include <gtest/gtest.h>
 

@@ -13,16 +13,24 @@ from pathlib import Path
 FLOORS = [
     ["platform"],
     ["core"],
+    ["texts"],
     ["picture"],
+    ["containers"],
     ["processing"],
+    ["drawing"],
     ["formats"],
-    ["registry"],  # the files of src/picture that know every codec
-    ["metadata", "catalog", "plugins"],
+    ["metadata"],
+    ["registry"],
+    ["plugins"],
+    ["catalog"],
+    ["files"],
+    ["archive"],
+    ["settings"],  # below here, what a job needs of the settings comes in its options
     ["batch"],
+    ["pages"],
     ["cli", "desktop"],
 ]
 FLOOR = {room: floor for floor, rooms in enumerate(FLOORS) for room in rooms}
-REGISTRY_FILES = {"registry", "load_picture", "write_picture", "format_switches"}
 
 # What only the folder of one system may include or ask for. Files are read and written through src/platform.
 # What a plug-in author includes stands alone, so it may ask which system it is compiled for.
@@ -36,6 +44,9 @@ SYSTEM_MACRO = re.compile(r"\s*#\s*(if|elif|ifdef|ifndef).*(_WIN32|_WIN64|\bWIN3
                           r"__FreeBSD__|__ANDROID__)")
 INCLUDE = re.compile(r'\s*#\s*include\s*(["<])([^">]+)[">]')
 
+# Rooms whose code still reads the settings itself; they lose their place here one by one.
+NOT_YET_ON_OPTIONS = {"formats", "metadata", "picture", "plugins", "processing", "registry", "catalog"}
+
 LONGEST_FILE = 900
 DRAWERS = {"util", "utils", "misc", "common", "helper", "helpers", "stuff"}
 
@@ -43,8 +54,6 @@ DRAWERS = {"util", "utils", "misc", "common", "helper", "helpers", "stuff"}
 def room_of(path):
     """The room of a file, given as its path below src/."""
     parts = path.split("/")
-    if parts[0] == "picture" and parts[-1].split(".")[0] in REGISTRY_FILES:
-        return "registry"
     return parts[0] if len(parts) > 1 else None
 
 
@@ -58,6 +67,8 @@ def include_breaches(path, line):
     in_system_folder = any(f"src/{path}".startswith(folder + "/") for folder in SYSTEM_FOLDERS)
     if quoted and other not in FLOOR:
         yield f'"{target}" is not named from src/ with its room'
+    elif quoted and other == "settings" and own in NOT_YET_ON_OPTIONS:
+        pass
     elif quoted and other != own and FLOOR[other] >= FLOOR.get(own, -1):
         yield f"{own} may not include {other} ({target})"
     elif quoted and any(f"src/{target}".startswith(folder + "/") for folder in SYSTEM_FOLDERS) and not in_system_folder:
@@ -121,11 +132,12 @@ EXAMPLES = [
     ("src/core/text.h", '#include "platform/files.h"\n', None),
     ("src/platform/files.h", "", None),
     ("src/platform/posix/files.cpp", '#include "platform/files.h"\n#include <unistd.h>\n#ifdef __linux__\n#endif\n', None),
-    ("src/picture/registry.cpp", '#include "formats/bmp.h"\n', None),
-    ("src/formats/bmp.h", '#include "picture/packed_image.h"\n', None),
-    ("src/picture/palette.h", '#include "formats/bmp.h"\n', "picture may not include formats"),
-    ("src/formats/pcx.cpp", '#include "picture/registry.h"\n', "formats may not include registry"),
-    ("src/catalog/thumb.cpp", '#include "plugins/bridge.h"\n', "catalog may not include plugins"),
+    ("src/registry/registry.cpp", '#include "formats/bmp/bmp.h"\n', None),
+    ("src/formats/bmp/bmp.h", '#include "picture/packed_image.h"\n', None),
+    ("src/picture/palette.h", '#include "formats/bmp/bmp.h"\n', "picture may not include formats"),
+    ("src/formats/pcx/pcx.cpp", '#include "registry/registry.h"\n', "formats may not include registry"),
+    ("src/plugins/bridge.cpp", '#include "catalog/thumb.h"\n', "plugins may not include catalog"),
+    ("src/drawing/text.cpp", '#include "settings/settings.h"\n', "drawing may not include settings"),
     ("src/cli/info.cpp", '#include "desktop/window.h"\n', "cli may not include desktop"),
     ("src/core/near.cpp", '#include "near.h"\n', "not named from src/"),
     ("src/core/own.cpp", '#include "platform/posix/own.h"\n', "belongs to one system"),

@@ -7,8 +7,8 @@
 #include <map>
 #include <sstream>
 
-#include "metadata/exif_source.h"
-#include "metadata/exif_walk.h"
+#include "metadata/exif/exif_source.h"
+#include "metadata/exif/exif_walk.h"
 #include "support/files.h"
 #include "support/peers.h"
 

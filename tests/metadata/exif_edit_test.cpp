@@ -1,4 +1,4 @@
-#include "metadata/exif_edit.h"
+#include "metadata/exif/exif_edit.h"
 
 #include <gmock/gmock.h>
 

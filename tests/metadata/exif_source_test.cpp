@@ -1,4 +1,4 @@
-#include "metadata/exif_source.h"
+#include "metadata/exif/exif_source.h"
 
 #include <gtest/gtest.h>
 

@@ -1,4 +1,4 @@
-#include "metadata/exif_thumbnail.h"
+#include "catalog/thumbnails/exif_thumbnail.h"
 
 #include <gtest/gtest.h>
 

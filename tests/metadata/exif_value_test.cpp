@@ -1,4 +1,4 @@
-#include "metadata/exif_value.h"
+#include "metadata/exif/exif_value.h"
 
 #include <gtest/gtest.h>
 
@@ -7,7 +7,7 @@
 #include <cstring>
 #include <random>
 
-#include "metadata/exif_tags.h"
+#include "metadata/exif/exif_tags.h"
 #include "support/hex.h"
 
 namespace fotomill::test {

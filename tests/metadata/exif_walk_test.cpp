@@ -1,4 +1,4 @@
-#include "metadata/exif_walk.h"
+#include "metadata/exif/exif_walk.h"
 
 #include <gmock/gmock.h>
 

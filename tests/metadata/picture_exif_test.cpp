@@ -1,8 +1,8 @@
-#include "metadata/picture_exif.h"
+#include "metadata/exif/picture_exif.h"
 
 #include <gtest/gtest.h>
 
-#include "metadata/exif_edit.h"
+#include "metadata/exif/exif_edit.h"
 #include "support/codecs.h"
 #include "support/hex.h"
 

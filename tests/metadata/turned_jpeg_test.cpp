@@ -1,13 +1,13 @@
-#include "metadata/turned_jpeg.h"
+#include "files/turned_jpeg.h"
 
 #include <gtest/gtest.h>
 
+#include "containers/jpeg_segments.h"
 #include "core/choice_lists.h"
-#include "core/settings.h"
-#include "formats/jpeg.h"
-#include "formats/jpeg_segments.h"
-#include "metadata/exif_edit.h"
-#include "metadata/exif_walk.h"
+#include "formats/jpeg/jpeg.h"
+#include "metadata/exif/exif_edit.h"
+#include "metadata/exif/exif_walk.h"
+#include "settings/settings.h"
 #include "support/codecs.h"
 #include "support/files.h"
 #include "support/hex.h"

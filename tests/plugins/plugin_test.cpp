@@ -2,13 +2,13 @@
 
 #include <filesystem>
 
-#include "core/configuration.h"
 #include "core/data_folder.h"
-#include "core/settings.h"
-#include "picture/registry.h"
 #include "platform/paths.h"
 #include "plugins/plugin_bridge.h"
 #include "plugins/plugin_table.h"
+#include "registry/registry.h"
+#include "settings/configuration.h"
+#include "settings/settings.h"
 #include "support/files.h"
 #include "support/scoped_settings.h"
 

@@ -1,4 +1,4 @@
-#include "processing/colour_transform.h"
+#include "processing/color/colour_transform.h"
 
 #include <gtest/gtest.h>
 #include <lcms2.h>

@@ -1,6 +1,6 @@
 #include "processing/flatten.h"
 
-#include "processing/blend.h"
+#include "processing/color/blend.h"
 #include "processing/pictures.h"
 #include "processing/promote.h"
 

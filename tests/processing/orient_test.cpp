@@ -1,4 +1,4 @@
-#include "processing/orient.h"
+#include "processing/geometry/orient.h"
 
 #include "processing/pictures.h"
 #include "processing/promote.h"

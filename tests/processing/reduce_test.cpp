@@ -1,11 +1,11 @@
-#include "processing/reduce.h"
+#include "processing/palette/reduce.h"
 
 #include <cmath>
 #include <random>
 #include <set>
 
 #include "platform/fault.h"
-#include "processing/nearest_color.h"
+#include "processing/color/nearest_color.h"
 #include "processing/pictures.h"
 
 namespace fotomill {

@@ -1,4 +1,4 @@
-#include "processing/scale.h"
+#include "processing/geometry/scale.h"
 
 #include <algorithm>
 #include <array>
@@ -8,10 +8,10 @@
 
 #include "core/choice_lists.h"
 #include "platform/fault.h"
-#include "processing/orient.h"
+#include "processing/geometry/orient.h"
+#include "processing/geometry/resample_kernels.h"
 #include "processing/pictures.h"
 #include "processing/promote.h"
-#include "processing/resample_kernels.h"
 
 namespace fotomill {
 namespace {

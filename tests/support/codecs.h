@@ -5,7 +5,7 @@
 #include <string>
 #include <vector>
 
-#include "picture/registry.h"
+#include "registry/registry.h"
 
 namespace fotomill::test {
 

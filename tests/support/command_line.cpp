@@ -2,7 +2,7 @@
 
 #include <cstdio>
 
-#include "cli/command.h"
+#include "cli/frame/command.h"
 #include "support/scoped_settings.h"
 
 namespace fotomill::test {

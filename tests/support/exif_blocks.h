@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-#include "metadata/exif_walk.h"
+#include "metadata/exif/exif_walk.h"
 
 namespace fotomill::test {
 

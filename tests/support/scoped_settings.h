@@ -1,6 +1,6 @@
 #pragma once
 
-#include "core/settings.h"
+#include "settings/settings.h"
 
 namespace fotomill::test {
 

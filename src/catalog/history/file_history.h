@@ -1,0 +1,107 @@
+#pragma once
+
+#include <cstdint>
+#include <span>
+#include <string>
+#include <string_view>
+
+#include "catalog/thumbnails/thumbnail_record.h"
+
+namespace fotomill {
+
+// The file history: which picture files the user applied which function to, and when. A list in memory, kept between runs
+// in the text file FileHistoryDatabase + ".fhdb" of the data folder, one line for each entry in list order:
+//
+//   tab PATH: path  tab FUNCTION: decimal  tab ACCESSED: decimal seconds since 1970 UTC  tab END: newline
+//
+// Creation time and size are asked of the file again when an entry is loaded. All of this belongs to the main thread.
+
+// Numbers in the file, and bits of FileHistoryFunctions.
+enum class FileFunction : int32_t {
+  View = 0,
+  Paint,
+  ContactSheet,
+  WebGallery,
+  Annotate,
+  Print,
+  Transform,
+  Filter,
+  Effects,
+  Convert,
+  GetInfo,
+  MoveAndCopy,
+  CopyToClipboard,
+  Crop,
+  Matt,
+  Watermark,
+  FileTime,
+  PhotoWorkshop,
+  FindSimilar,
+  Catalog,
+};
+inline constexpr int32_t kFileFunctionCount = 20;
+inline constexpr int32_t kNoFileFunction = -1;
+
+// Its name as lists show it; empty for a number that is none.
+std::string_view FileFunctionName(int32_t function);
+// The function of a name, whatever its case; kNoFileFunction when there is none.
+int32_t FileFunctionOfName(std::string_view name);
+
+// Stands for the file's own creation time, or for now.
+inline constexpr int32_t kOwnTime = -1;
+
+// Whether a path comes back from the file as it was: 1 to 260 bytes without tab, line end or zero byte.
+bool FitsFileHistory(std::string_view path);
+
+// Adds an entry, or gives the entry of that path another function and access time, puts the list in order and limits it
+// as the settings say. False when nothing was recorded: the history or that function is switched off, the path is no
+// regular file or does not fit, or there is no memory.
+bool RecordFileHistory(std::string_view path, FileFunction function, int32_t created = kOwnTime, int32_t accessed = kOwnTime);
+// Takes the entry of a path out of the list. False when there is none.
+bool RemoveFromFileHistory(std::string_view path);
+
+// Reads the history file into the list. False when the history is switched off or the file cannot be read.
+bool LoadFileHistory();
+// Writes the list to the history file, as it is, and frees it. Switched off, the history file is deleted; without a list
+// as well, provided that LoadFileHistory was called before. False when the file cannot be written or was never read.
+bool SaveFileHistory();
+// Frees the list.
+bool ClearFileHistory();
+
+// Path of the history file; empty without a data folder, or when FileHistoryDatabase is no plain name.
+std::string FileHistoryPath();
+
+// One entry as lists show it. The path is a view into the list, valid until it changes.
+struct FileHistoryEntry {
+  std::string_view path;
+  int32_t function = 0;
+  int32_t created = 0, accessed = 0;  // seconds since 1970 UTC
+  uint64_t size = 0;                  // bytes
+};
+size_t FileHistoryCount();
+FileHistoryEntry FileHistoryAt(size_t index);  // from 0, the last use first
+// The thumbnail of an entry, read from its file's thumbnail file when it is first asked for; null when there is none. It
+// stays where it is until the list changes.
+const ThumbnailRecord* FileHistoryThumbnail(size_t index);
+
+// What a command did to a file.
+struct FileUse {
+  std::string path;  // absolute
+  FileFunction function = FileFunction::View;
+  int32_t created = kOwnTime;
+  int32_t accessed = kOwnTime;
+  bool removed = false;  // the path is gone: its entry is taken out instead
+};
+
+enum class HistoryUpdate {
+  Done,     // loaded, recorded and saved
+  Off,      // switched off: nothing was recorded
+  NotRead,  // the history file cannot be read, or is something else: it was left alone
+  Failed,   // it could not be written, or there is no place for it: it is as it was
+};
+// Records uses, in order, for good: locks the history file, reads it afresh, so that what other processes recorded stays,
+// records, and replaces the file in one step. `recorded` counts the uses that were. With the history switched off in the
+// configuration file the history file is deleted; switched off for this run only, it stays. The list is free afterwards.
+HistoryUpdate UpdateFileHistory(std::span<const FileUse> uses, size_t* recorded = nullptr);
+
+}  // namespace fotomill

@@ -1,0 +1,201 @@
+#include "cli/commands/config.h"
+
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "cli/frame/options.h"
+#include "cli/frame/result_output.h"
+#include "cli/frame/shown_text.h"
+#include "platform/files.h"
+#include "settings/configuration.h"
+
+namespace fotomill::cli {
+
+namespace {
+
+struct ConfigOptions {
+  bool json = false;
+  bool changed = false;
+  bool dryRun = false;
+};
+
+// Texts of the configuration are bytes. Where they are not UTF-8, each byte stands for the character of that number.
+std::string JsonText(std::string_view text) {
+  if (IsUtf8(text)) return std::string(text);
+  std::string wide;
+  for (const char c : text) {
+    const auto byte = static_cast<unsigned char>(c);
+    if (byte < 0x80) {
+      wide += c;
+    } else {
+      wide += static_cast<char>(0xC0 | byte >> 6);
+      wide += static_cast<char>(0x80 | (byte & 0x3F));
+    }
+  }
+  return wide;
+}
+
+Json KeyElement(const KeyRow& row) {
+  Json element{{"name", row.name}, {"type", row.type}};
+  if ((row.type & KEY_TEXT) != 0) {
+    element["value"] = JsonText(TextIn(row));
+    element["default"] = JsonText(DefaultText(row));
+  } else {
+    element["value"] = NumberIn(row);
+    element["default"] = DefaultNumber(row);
+  }
+  return element;
+}
+
+void PrintProblem(const CommandContext& context, std::string_view message) {
+  const std::string path = context.io.errTerminal ? EscapeControls(ConfigurationPath()) : ConfigurationPath();
+  std::fprintf(context.io.err, "%s: %.*s\n", path.empty() ? "fotomill" : path.c_str(), static_cast<int>(message.size()),
+               message.data());
+}
+
+// The rows of all named keys; false, after a message, when one is unknown.
+bool FindKeys(const CommandContext& context, std::vector<const KeyRow*>& rows) {
+  for (const std::string& name : context.names.values) {
+    rows.push_back(FindKey(name));
+    if (rows.back() != nullptr) continue;
+    UsageError(context, "There is no key \"" + name + "\"; the nearest is " + std::string(NearestKey(name)) + ".");
+    return false;
+  }
+  return true;
+}
+
+void NoteUnreadable(const CommandContext& context) {
+  if (StateOfConfiguration() != ConfigurationState::Unreadable) return;
+  PrintProblem(context, "The configuration file cannot be read; the defaults stand.");
+}
+
+int RunList(const ConfigOptions& options, const CommandContext& context) {
+  NoteUnreadable(context);
+  ResultOutput output(context, options.json);
+  for (const KeyRow& row : Keys()) {
+    if (options.changed && (IsAtDefault(row) || (row.type & KEY_INTERNAL) != 0)) continue;
+    if (output.IsJson()) {
+      output.Element(KeyElement(row));
+    } else {
+      output.Line(output.Shown(std::string(row.name) + "=" + ValueText(row)));
+    }
+  }
+  return kExitOk;
+}
+
+int RunGet(const ConfigOptions& options, const CommandContext& context) {
+  std::vector<const KeyRow*> rows;
+  if (!FindKeys(context, rows)) return kExitUsage;
+  NoteUnreadable(context);
+  ResultOutput output(context, options.json);
+  for (const KeyRow* row : rows) {
+    if (output.IsJson()) {
+      output.Element(KeyElement(*row));
+    } else {
+      output.Line(output.Shown(ValueText(*row)));
+    }
+  }
+  return kExitOk;
+}
+
+// One change, done or only foretold: "KEY: OLD -> NEW".
+int Change(const ConfigOptions& options, const CommandContext& context, const KeyRow& row, const SettingValue* value) {
+  const std::string before = ValueText(row);
+  SaveResult result = SaveResult::Done;
+  if (!options.dryRun) {
+    result = value != nullptr ? StoreSetting(row, *value) : RemoveSetting(row);
+  } else if (value != nullptr) {
+    StoreValue(row, *value);
+  } else {
+    StoreDefault(row);
+  }
+  if (const std::string_view message = SaveMessage(result); !message.empty()) {
+    PrintProblem(context, message);
+    return kExitFailed;
+  }
+  ResultOutput output(context, options.json);
+  if (output.IsJson()) {
+    output.Element(KeyElement(row));
+  } else {
+    output.Line(output.Shown(std::string(row.name) + ": " + before + " -> " + ValueText(row)));
+  }
+  return kExitOk;
+}
+
+int RunSet(const ConfigOptions& options, const CommandContext& context) {
+  const std::string& name = context.names.values[0];
+  const KeyRow* const row = FindKey(name);
+  if (row == nullptr) {
+    return UsageError(context, "There is no key \"" + name + "\"; the nearest is " + std::string(NearestKey(name)) + ".");
+  }
+  const SettingValue value = ReadValue(*row, context.names.values[1], ValueSource::Person);
+  if (!value.usable) return UsageError(context, FaultMessage(*row, value.fault));
+  return Change(options, context, *row, &value);
+}
+
+int RunUnset(const ConfigOptions& options, const CommandContext& context) {
+  std::vector<const KeyRow*> rows;
+  if (!FindKeys(context, rows)) return kExitUsage;
+  return Change(options, context, *rows[0], nullptr);
+}
+
+int RunPath(const ConfigOptions& options, const CommandContext& context) {
+  const std::string path = ConfigurationPath();
+  if (path.empty()) {
+    PrintProblem(context, SaveMessage(SaveResult::NoFolder));
+    return kExitFailed;
+  }
+  ResultOutput output(context, options.json);
+  if (output.IsJson()) {
+    Json element;
+    PutName(element, "path", path);
+    element["exists"] = platform::FileExists(path);
+    output.Element(element);
+  } else {
+    output.Line(output.Shown(path));
+  }
+  return kExitOk;
+}
+
+using Run = int (*)(const ConfigOptions& options, const CommandContext& context);
+
+std::shared_ptr<ConfigOptions> SetUp(CLI::App& app, CommandContext& context, Run run, const char* jsonHelp, const char* example) {
+  auto options = std::make_shared<ConfigOptions>();
+  AddFlag(app, "--json", options->json, jsonHelp);
+  SetFooter(app, std::string("Example: ") + example);
+  context.run = [options, &context, run] { return run(*options, context); };
+  return options;
+}
+
+constexpr const char* kKeyJson = "One JSON array of {name, type, value, default}";
+
+}  // namespace
+
+void SetUpConfigList(CLI::App& app, CommandContext& context) {
+  const auto options = SetUp(app, context, RunList, kKeyJson, "fotomill config list --changed");
+  AddFlag(app, "--changed", options->changed, "Only keys that differ from their default");
+}
+
+void SetUpConfigGet(CLI::App& app, CommandContext& context) {
+  context.names.Declare("KEY...", "Names of keys; their values are printed one a line", 1);
+  SetUp(app, context, RunGet, kKeyJson, "fotomill config get JpegCompression");
+}
+
+void SetUpConfigSet(CLI::App& app, CommandContext& context) {
+  context.names.Declare("KEY VALUE", "Name of a key, and the value it has from now on", 2, 2);
+  const auto options = SetUp(app, context, RunSet, kKeyJson, "fotomill config set JpegCompression 85");
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would change");
+}
+
+void SetUpConfigUnset(CLI::App& app, CommandContext& context) {
+  context.names.Declare("KEY", "Name of the key that gets its default again", 1, 1);
+  const auto options = SetUp(app, context, RunUnset, kKeyJson, "fotomill config unset JpegCompression");
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would change");
+}
+
+void SetUpConfigPath(CLI::App& app, CommandContext& context) {
+  SetUp(app, context, RunPath, "One JSON array of {path, exists}", "fotomill config path");
+}
+
+}  // namespace fotomill::cli

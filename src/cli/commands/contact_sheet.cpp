@@ -1,0 +1,137 @@
+#include "cli/commands/contact_sheet.h"
+
+#include <charconv>
+#include <memory>
+#include <optional>
+#include <string>
+
+#include "cli/frame/destination_format.h"
+#include "cli/frame/file_selection.h"
+#include "cli/frame/options.h"
+#include "cli/frame/result_output.h"
+#include "cli/frame/terminal_box.h"
+#include "cli/frame/terminal_prompts.h"
+#include "pages/catalogue_page.h"
+#include "platform/files.h"
+#include "settings/settings.h"
+
+namespace fotomill::cli {
+
+namespace {
+
+struct SheetOptions {
+  SelectionOptions selection;
+  std::string to, dest;
+  std::string frame = "raised";
+  std::string background;
+  int32_t columns = 0, rows = 0;  // 0: as the settings say
+  int32_t cell = 96;
+  int32_t pageWidth = 0, pageHeight = 0;
+  int32_t jobs = 0;
+  bool blackText = false;
+  bool noNames = false;
+  bool reduce = false;
+  bool dryRun = false;
+  bool json = false;
+};
+
+constexpr int32_t kColumns = 5, kRows = 4, kMostCells = 1000;
+constexpr const char* kNoFont =
+    " There is no font for the names; --no-names does without, the package fonts-dejavu-core has one.";
+constexpr Color kPaper = 0xFFFFFF;
+
+// A colour as people write it, RRGGBB.
+std::optional<Color> ColorOf(std::string_view text) {
+  uint32_t value = 0;
+  if (text.starts_with('#')) text.remove_prefix(1);
+  const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), value, 16);
+  if (text.size() != 6 || error != std::errc() || end != text.data() + text.size()) return std::nullopt;
+  return (value & 0xFF) << 16 | (value & 0xFF00) | value >> 16;
+}
+
+int32_t FirstAbove0(int32_t option, int32_t setting, int32_t usual) {
+  if (option > 0) return option;
+  return setting > 0 && setting <= kMostCells ? setting : usual;
+}
+
+// What is wrong with the options, as a sentence; empty when nothing is. Fills `sheet`.
+std::string ReadLook(const SheetOptions& options, CatalogueLook& look) {
+  look.columns = FirstAbove0(options.columns, settings.CatalogLandscapeWide, kColumns);
+  look.rows = FirstAbove0(options.rows, settings.CatalogLandscapeDeep, kRows);
+  look.cellWidth = look.cellHeight = options.cell;
+  look.pageWidth = options.pageWidth;
+  look.pageHeight = options.pageHeight;
+  look.frame = options.frame == "none" ? CellFrame::None : options.frame == "flat" ? CellFrame::Flat : CellFrame::Raised;
+  look.blackText = options.blackText;
+  look.names = !options.noNames;
+  if (options.blackText) look.background = kPaper;
+  if (!options.background.empty()) {
+    const auto color = ColorOf(options.background);
+    if (!color) return "--background takes a colour as RRGGBB, such as FFFFFF.";
+    look.background = *color;
+  }
+  const Rectangle page = PageSize(look);
+  if (CheckPackedSize(page.width, page.height, 24) != Status::Ok) {
+    return "A page of " + std::to_string(page.width) + " x " + std::to_string(page.height) + " pixels is too large.";
+  }
+  const Rectangle first = CellPlace(look, 0);
+  if (first.x < 0 || first.y < 0) return "The page is smaller than its cells.";
+  return {};
+}
+
+int RunSheet(const SheetOptions& options, const CommandContext& context) {
+  BatchJob job;
+  ContactSheetOptions sheet;
+  if (const std::string wrong = ReadDestinationFormat(options.to, job); !wrong.empty()) return UsageError(context, wrong);
+  if (const std::string wrong = ReadLook(options, sheet.look); !wrong.empty()) return UsageError(context, wrong);
+  if (platform::FileExists(options.dest) && !platform::IsFolder(options.dest)) {
+    return UsageError(context, "\"" + options.dest + "\" is not a folder.");
+  }
+  const auto files = SelectFiles(options.selection, context);
+  if (!files) return kExitUsage;
+
+  ResultOutput output(context, options.json);
+  TerminalBox box(output, true, false);
+  TerminalPrompts prompts(context, output);
+  job.destinationFolder = options.dest;
+  job.box = &box;
+  job.naming.beside = false;
+  if (context.MayAsk()) job.prompts = &prompts;
+  sheet.page = {.reduce = options.reduce, .dryRun = options.dryRun};
+  sheet.reduceHint = "Use --reduce to have them reduced.";
+  sheet.jobs = static_cast<uint32_t>(options.jobs);
+  if (const Status status = RunContactSheet(*files, sheet, job); status != Status::Ok) {
+    const std::string message(StatusMessage(status));
+    output.Message(output.ShownMessage(options.dest) + ": " + message + (status == Status::ResourceError ? kNoFont : ""));
+    return kExitFailed;
+  }
+  return FinishBatch(job);
+}
+
+}  // namespace
+
+void SetUpContactSheet(CLI::App& app, CommandContext& context) {
+  auto options = std::make_shared<SheetOptions>();
+  AddSelection(app, options->selection, context);
+  Require(AddName(app, "-t,--to", options->to, "EXT", "Format of the pages, by its extension"));
+  Require(AddName(app, "-d,--dest", options->dest, "DIR", "Folder of the pages, made with its parents"));
+  AddNumber(app, "--columns", options->columns, "N", 1, kMostCells, "Pictures side by side; 5 unless CatalogLandscapeWide says");
+  AddNumber(app, "--rows", options->rows, "N", 1, kMostCells, "Pictures one above the other; 4 unless CatalogLandscapeDeep says");
+  AddNumber(app, "--cell", options->cell, "N", 8, 4096, "Pixels of a picture's longer side; 96 unless given");
+  AddNumber(app, "--page-width", options->pageWidth, "N", 1, 65535, "Pixels; as wide as the cells need unless given");
+  AddNumber(app, "--page-height", options->pageHeight, "N", 1, 65535, "The same for the height");
+  AddChoice(app, "--frame", options->frame, "HOW", {"none", "raised", "flat"}, "Frame around each cell; raised unless given");
+  AddFlag(app, "--black-text", options->blackText, "Names and flat frames in black, on white unless --background says");
+  AddText(app, "--background", options->background, "RRGGBB", "Colour of the page; 606060 unless given");
+  AddFlag(app, "--no-names", options->noNames, "No names beneath the pictures");
+  AddFlag(app, "--reduce", options->reduce, "Reduce the colours of pages that are too deep for the format");
+  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, INT32_MAX, "Pictures at work at a time; 0, the default, is one a core");
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would be done");
+  AddFlag(app, "--json", options->json, "One JSON array of {file, destination, status, message}");
+  SetFooter(app,
+            "Pages are called Catalog_00001.EXT and so on, after PrefixCatalog; no page replaces another. The font of the "
+            "names is CatalogFontName.\n\nExample: fotomill contact-sheet holiday -r --to jpg --dest sheets --cell 160");
+  context.run = [options, &context] { return RunSheet(*options, context); };
+}
+
+}  // namespace fotomill::cli

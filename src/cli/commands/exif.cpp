@@ -1,0 +1,220 @@
+#include "cli/commands/exif.h"
+
+#include <charconv>
+#include <cmath>
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "cli/frame/file_selection.h"
+#include "cli/frame/options.h"
+#include "cli/frame/result_output.h"
+#include "cli/frame/used_files.h"
+#include "metadata/exif/exif_source.h"
+#include "metadata/exif/exif_text.h"
+#include "metadata/gps.h"
+#include "platform/files.h"
+#include "platform/output_file.h"
+
+namespace fotomill::cli {
+
+namespace {
+
+struct ExifOptions {
+  SelectionOptions selection;
+  bool json = false;
+  std::string thumbnail;              // file for the embedded thumbnail; empty: not asked for
+  std::string overwrite = "refuse";   // what becomes of one that is there
+  std::vector<std::string> distance;  // two places, or none
+};
+
+// The walk's lines as JSON directories.
+class JsonLines : public ExifSink {
+ public:
+  void Directory(int32_t, std::string_view label) override {
+    directories_.push_back({{"label", label}, {"entries", Json::array()}});
+  }
+  void Line(const ExifLine& line) override {
+    directories_.back()["entries"].push_back({{"tag", line.value.tag},
+                                              {"name", line.name},
+                                              {"type", line.value.type},
+                                              {"count", line.value.count},
+                                              {"text", line.text}});
+  }
+  Json Take() { return std::move(directories_); }
+
+ private:
+  Json directories_ = Json::array();
+};
+
+// What became of one file.
+struct Outcome {
+  Status status = Status::Ok;
+  std::string hint;  // behind the message
+  std::string name;  // of the file that the message is about, the picture's own when empty
+  bool hasExif = false;
+  bool cutShort = false;  // there is more of it than a walk takes
+};
+
+Outcome WriteThumbnail(std::span<const uint8_t> bytes, const ExifOptions& options) {
+  const std::string& path = options.thumbnail;
+  if (bytes.empty()) return {Status::NoImages, "There is no embedded thumbnail.", {}};
+  const bool replace = options.overwrite == "replace";
+  const std::string taken = "There is a file of that name; \"--overwrite replace\" takes its place.";
+  if (!replace && platform::FileExists(path)) return {Status::ErrorCreatingFile, taken, path};
+  platform::OutputFile file;
+  if (!file.Create(path)) return {Status::ErrorCreatingFile, {}, path};
+  if (!file.Write(bytes)) return {Status::ErrorWritingFile, {}, path};
+  switch (file.Commit(replace ? platform::Existing::Replace : platform::Existing::Refuse)) {
+    case platform::CommitResult::Done: return {};
+    case platform::CommitResult::Taken: return {Status::ErrorCreatingFile, taken, path};
+    case platform::CommitResult::Failed: break;
+  }
+  return {Status::ErrorWritingFile, {}, path};
+}
+
+// Walks the EXIF of one file into `sink` and writes its thumbnail where that is asked for.
+Outcome WalkFile(const SelectedFile& file, const ExifOptions& options, ExifSink& sink) {
+  if (file.status != Status::Ok) return {file.status, file.hint, {}};
+  ExifSource source;
+  if (const Status status = source.Open(file.name.c_str()); status != Status::Ok) return {status, {}, {}};
+  const auto block = source.Block();
+  ExifFindings findings;
+  if (!block.empty() && !WalkExif(block, &sink, &findings)) {
+    return {Status::DamagedFile, "The EXIF block does not begin as one.", {}};
+  }
+  Outcome outcome;
+  if (!options.thumbnail.empty()) outcome = WriteThumbnail(ExifThumbnail(block, findings), options);
+  outcome.hasExif = !block.empty();
+  outcome.cutShort = findings.cutShort;
+  if (!source.Intact()) return {Status::FileReadError, "The file became shorter meanwhile.", {}};
+  return outcome;
+}
+
+class ExifRun {
+ public:
+  ExifRun(const ExifOptions& options, const CommandContext& context) : options_(options), output_(context, options.json) {}
+
+  void ReportFiles(const std::vector<SelectedFile>& files) {
+    for (const SelectedFile& file : files) {
+      if (!output_.GoesOn()) return;
+      const Outcome outcome = options_.json ? ReportJson(file) : ReportLines(file, files.size() > 1);
+      if (outcome.status != Status::Ok) {
+        output_.Failure(outcome.name.empty() ? file.name : outcome.name, outcome.status, outcome.hint);
+        continue;
+      }
+      output_.CountFile();
+      used_.Add(file.name);
+      if (!outcome.hasExif && !options_.json) {
+        output_.Note(output_.ShownMessage(file.name) + ": There is no EXIF in this file.");
+      }
+      if (outcome.cutShort) output_.Note(output_.ShownMessage(file.name) + ": There is more EXIF than is shown here.");
+    }
+  }
+
+  void ReportDistance(const double (&degrees)[4]) {
+    const double distance = GpsDistance(degrees[0], degrees[1], degrees[2], degrees[3]);
+    if (options_.json) {
+      output_.Element({{"distance", distance}, {"unit", GpsDistanceUnit()}});
+      return;
+    }
+    char text[64];
+    std::snprintf(text, sizeof text, "%.3f ", distance);
+    output_.Line(std::string(text).append(GpsDistanceUnit()));
+  }
+
+  int Finish() { return output_.Finish(); }
+
+ private:
+  Outcome ReportJson(const SelectedFile& file) {
+    JsonLines lines;
+    Json element;
+    const Outcome outcome = WalkFile(file, options_, lines);
+    PutName(element, "file", file.name);
+    PutStatus(element, outcome.status);
+    element["directories"] = lines.Take();
+    output_.Element(element);
+    return outcome;
+  }
+
+  // The lines of one file in one piece, so that they cost one write; of several files, each under its name.
+  Outcome ReportLines(const SelectedFile& file, bool named) {
+    lines_.Clear();
+    Outcome outcome = WalkFile(file, options_, lines_);
+    if (outcome.status == Status::Ok && !lines_.Complete()) outcome.status = Status::MemoryAllocationError;
+    if (lines_.Text().empty()) return outcome;
+    text_.clear();
+    if (named) text_.append(output_.Shown(file.name)).append("\n");
+    text_ += lines_.Text();
+    text_.pop_back();  // Line ends it
+    output_.Line(text_);
+    return outcome;
+  }
+
+  const ExifOptions& options_;
+  ResultOutput output_;
+  UsedFiles used_{FileFunction::GetInfo};
+  ExifText lines_;
+  std::string text_;
+};
+
+bool ReadNumber(std::string_view text, double most, double& number) {
+  if (text.starts_with('+')) text.remove_prefix(1);
+  const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
+  return error == std::errc{} && end == text.data() + text.size() && std::abs(number) <= most;
+}
+
+// Reads "LAT,LON" into two numbers.
+bool ReadPlace(std::string_view text, double* degrees) {
+  const size_t comma = text.find(',');
+  return comma != std::string_view::npos && ReadNumber(text.substr(0, comma), 90, degrees[0]) &&
+         ReadNumber(text.substr(comma + 1), 360, degrees[1]);
+}
+
+bool IsSameFile(const std::string& one, const std::string& other) {
+  const platform::FileFacts a = platform::FactsOf(one), b = platform::FactsOf(other);
+  return a.kind == platform::FileKind::Regular && b.kind == a.kind && a.device == b.device && a.identity == b.identity;
+}
+
+int RunExif(const ExifOptions& options, const CommandContext& context) {
+  double degrees[4] = {};
+  const bool measures = !options.distance.empty();
+  for (size_t i = 0; i < options.distance.size(); ++i) {
+    if (!ReadPlace(options.distance[i], degrees + 2 * i)) {
+      return UsageError(context, "\"" + options.distance[i] + "\" is no LAT,LON in decimal degrees.");
+    }
+  }
+  const bool alone = measures && context.names.values.empty() && options.selection.filesFrom.empty();
+  const auto files = alone ? std::vector<SelectedFile>{} : SelectFiles(options.selection, context);
+  if (!files) return kExitUsage;
+  if (!options.thumbnail.empty()) {
+    if (files->size() != 1) return UsageError(context, "--thumbnail takes the thumbnail of one file.");
+    if (IsSameFile(files->front().name, options.thumbnail)) {
+      return UsageError(context, "--thumbnail names the picture itself.");
+    }
+  }
+  ExifRun run(options, context);
+  run.ReportFiles(*files);
+  if (measures) run.ReportDistance(degrees);
+  return alone ? kExitOk : run.Finish();
+}
+
+}  // namespace
+
+void SetUpExif(CLI::App& app, CommandContext& context) {
+  auto options = std::make_shared<ExifOptions>();
+  AddSelection(app, options->selection, context);
+  AddFlag(app, "--json", options->json, "One JSON array, an object for each file");
+  AddName(app, "--thumbnail", options->thumbnail, "OUT", "Write the embedded thumbnail to this file, as it is");
+  AddChoice(app, "--overwrite", options->overwrite, "HOW", {"refuse", "replace"},
+            "When OUT is there: refuse (the default) or replace");
+  AddTexts(app, "--distance", options->distance, 2, "LAT,LON LAT,LON",
+           "Tell how far two places in decimal degrees are apart, in the unit that ExifDistinceUnits chooses");
+  SetFooter(app,
+            "Reads JPEG, TIFF, HD Photo, PNG and WebP files and bare EXIF blocks; several files each have their name on a "
+            "line above.\n\n"
+            "Example: fotomill exif photo.jpg --thumbnail small.jpg");
+  context.run = [options, &context] { return RunExif(*options, context); };
+}
+
+}  // namespace fotomill::cli

@@ -1,0 +1,143 @@
+#include "cli/commands/info.h"
+
+#include <memory>
+#include <string>
+
+#include "batch/picture_failure.h"
+#include "cli/frame/file_selection.h"
+#include "cli/frame/options.h"
+#include "cli/frame/result_output.h"
+#include "cli/frame/used_files.h"
+#include "core/shown_text.h"
+#include "core/text.h"
+#include "registry/registry.h"
+
+namespace fotomill::cli {
+
+namespace {
+
+struct InfoOptions {
+  SelectionOptions selection;
+  bool json = false;
+};
+
+std::string Resolution(double pixelsPerInch) {
+  char text[32];
+  std::snprintf(text, sizeof text, "%g", pixelsPerInch);
+  return text;
+}
+
+// How long each frame is to be shown, and how often all of them are, 0 for ever.
+void AddFrames(const PictureRecord& picture, Json& facts) {
+  AnimationPointer animation;
+  if (picture.pageCount < 2 || OpenAnimation(picture.fileName.c_str(), animation) != Status::Ok) return;
+  facts["delaysMs"] = animation->Delays();
+  facts["rounds"] = animation->Rounds();
+}
+
+Json FactsAsJson(const PictureRecord& picture) {
+  const FormatEntry& row = FormatRow(picture.formatIndex);
+  Json facts;
+  facts["format"] = row.extension.view();
+  facts["index"] = picture.formatIndex;
+  facts["description"] = row.description.view();
+  facts["typeName"] = picture.typeName.view();
+  facts["width"] = picture.width;
+  facts["height"] = picture.height;
+  facts["bitsPerPixel"] = picture.bitsPerPixel;
+  facts["alpha"] = (picture.alphaFlags & kHasAlpha) != 0;
+  facts["fileSize"] = picture.fileSize;
+  facts["imageBytes"] = picture.imageBytes;
+  facts["details"] = Json::array();
+  for (size_t i = 0; i < picture.detailLines.Count(); ++i) facts["details"].push_back(picture.detailLines.Line(i));
+  facts["pages"] = picture.pageCount;
+  AddFrames(picture, facts);
+  if (picture.metadata.dpiX > 0) facts["dpiX"] = picture.metadata.dpiX;
+  if (picture.metadata.dpiY > 0) facts["dpiY"] = picture.metadata.dpiY;
+  return facts;
+}
+
+void AddFact(std::string& text, std::string_view label, std::string_view value) {
+  text.append(2, ' ').append(label).append(14 - label.size(), ' ').append(EscapeControls(value)).append(1, '\n');
+}
+
+// The lines of one file as one text, which leaves in one write.
+std::string FactsAsText(const PictureRecord& picture) {
+  const FormatEntry& row = FormatRow(picture.formatIndex);
+  std::string text;
+  AddFact(text, "Format", row.description.view());
+  if (!picture.typeName.empty()) AddFact(text, "Type", picture.typeName.view());
+  AddFact(text, "Dimensions", std::to_string(picture.width) + " x " + std::to_string(picture.height) + " pixels");
+  std::string depth = std::to_string(picture.bitsPerPixel) + (picture.bitsPerPixel == 1 ? " bit" : " bits");
+  if ((picture.alphaFlags & kHasAlpha) != 0) depth += " and alpha";
+  AddFact(text, "Depth", depth);
+  if (picture.pageCount > 1) AddFact(text, "Pages", std::to_string(picture.pageCount));
+  if (picture.metadata.dpiX > 0 && picture.metadata.dpiY > 0) {
+    AddFact(text, "Resolution",
+            Resolution(picture.metadata.dpiX) + " x " + Resolution(picture.metadata.dpiY) + " pixels per inch");
+  }
+  AddFact(text, "File size", WithThousands(picture.fileSize) + " bytes");
+  AddFact(text, "Image data", WithThousands(picture.imageBytes) + " bytes");
+  for (size_t i = 0; i < picture.detailLines.Count(); ++i) {
+    text.append(2, ' ').append(EscapeControls(picture.detailLines.Line(i))).append(1, '\n');
+  }
+  text.pop_back();
+  return text;
+}
+
+Status GatherFacts(const SelectedFile& file, PicturePointer& picture) {
+  if (file.status != Status::Ok) return file.status;
+  RETURN_IF_BAD(LoadPictureInfo(file.name.c_str(), picture));
+  const FormatEntry& row = FormatRow(picture->formatIndex);
+  if (CanTellDetails(row)) RETURN_IF_BAD(row.details(*picture));
+  return Status::Ok;
+}
+
+void ReportFile(const SelectedFile& file, ResultOutput& output, UsedFiles& used) {
+  PicturePointer picture;
+  const Status status = GatherFacts(file, picture);
+  const std::string hint = status == Status::Ok || !file.hint.empty() ? file.hint : OpenHint(file.name, status);
+  if (output.IsJson()) {
+    Json element;
+    PutName(element, "file", file.name);
+    PutStatus(element, status);
+    if (status == Status::Ok) {
+      element.update(FactsAsJson(*picture));
+    } else if (file.status == Status::Ok) {
+      const std::string_view looksLike = LooksLike(file.name, FindFormatByName(file.name));
+      if (!looksLike.empty()) element["looksLike"] = looksLike;
+    }
+    output.Element(element);
+  }
+  if (status != Status::Ok) {
+    output.Failure(file.name, status, hint);
+    return;
+  }
+  output.CountFile();
+  used.Add(file.name);
+  if (!output.IsJson()) output.Line(output.Shown(file.name) + "\n" + FactsAsText(*picture));
+}
+
+int RunInfo(const InfoOptions& options, const CommandContext& context) {
+  const auto files = SelectFiles(options.selection, context);
+  if (!files) return kExitUsage;
+  ResultOutput output(context, options.json);
+  UsedFiles used(FileFunction::GetInfo);
+  for (const SelectedFile& file : *files) {
+    if (!output.GoesOn()) break;
+    ReportFile(file, output, used);
+  }
+  return output.Finish();
+}
+
+}  // namespace
+
+void SetUpInfo(CLI::App& app, CommandContext& context) {
+  auto options = std::make_shared<InfoOptions>();
+  AddSelection(app, options->selection, context);
+  AddFlag(app, "--json", options->json, "One JSON array, an object for each file");
+  SetFooter(app, "Example: fotomill info holiday --recursive --json");
+  context.run = [options, &context] { return RunInfo(*options, context); };
+}
+
+}  // namespace fotomill::cli

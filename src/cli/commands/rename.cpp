@@ -1,0 +1,78 @@
+#include "cli/commands/rename.h"
+
+#include <algorithm>
+#include <memory>
+#include <set>
+#include <string>
+
+#include "batch/sequential_rename.h"
+#include "cli/frame/file_selection.h"
+#include "cli/frame/options.h"
+#include "cli/frame/result_output.h"
+#include "cli/frame/terminal_box.h"
+#include "platform/folders.h"
+
+namespace fotomill::cli {
+
+namespace {
+
+struct RenameCommandOptions {
+  SelectionOptions selection;
+  int32_t digits = 0;  // 0: as usual
+  int32_t seed = -1;   // -1: another one each time
+  bool undo = false;
+  bool dryRun = false;
+  bool json = false;
+};
+
+int RunUndo(const RenameCommandOptions& options, const std::vector<SelectedFile>& files, ResultOutput& output, BatchJob& job) {
+  std::set<std::string> only;
+  for (const SelectedFile& file : files) only.insert(platform::AbsolutePath(file.name));
+  if (UndoRename(only, options.dryRun, job)) return kExitOk;
+  output.Message("fotomill: What was renamed last is noted in the data folder but cannot be read.");
+  return kExitFailed;
+}
+
+int RunRenameCommand(const RenameCommandOptions& options, const CommandContext& context) {
+  const SelectionOptions& selection = options.selection;
+  std::vector<SelectedFile> files;
+  if (!options.undo || !context.names.values.empty() || !selection.filesFrom.empty()) {
+    auto selected = SelectFiles(selection, context);
+    if (!selected) return kExitUsage;
+    files = std::move(*selected);
+  }
+  ResultOutput output(context, options.json);
+  TerminalBox box(output, true, false);
+  BatchJob job;
+  job.box = &box;
+  job.rename = SequentialRenameFromSettings();
+  if (options.digits > 0) job.rename.digits = options.digits;
+  int status = kExitOk;
+  if (options.undo) {
+    status = RunUndo(options, files, output, job);
+  } else {
+    RenameOptions rename{.dryRun = options.dryRun};
+    if (options.seed >= 0) rename.seed = static_cast<uint64_t>(options.seed);
+    RunRename(files, rename, job);
+  }
+  return std::max(status, FinishBatch(job));
+}
+
+}  // namespace
+
+void SetUpRename(CLI::App& app, CommandContext& context) {
+  auto options = std::make_shared<RenameCommandOptions>();
+  AddSelection(app, options->selection, context);
+  AddFlag(app, "--undo", options->undo, "Give the files of the last run, or those of them that are named, their old names");
+  AddNumber(app, "--digits", options->digits, "N", 1, 10, "Digits of the numbers; 4 unless given");
+  AddNumber(app, "--seed", options->seed, "N", 0, INT32_MAX, "With SequentialRenameRandom: the same N, the same order");
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would be done");
+  AddFlag(app, "--json", options->json, "One JSON array of {file, destination, status, message}");
+  SetFooter(app,
+            "The keys SequentialRenameBaseName, BaseNumber, Increment, MaxAttempts, Sep, Hyphen, Prefix, Random, SkipCollide "
+            "and Update say how files are named; all begin with SequentialRename.\n\n"
+            "Example: fotomill --set SequentialRenameBaseName=holiday- rename photos --dry-run");
+  context.run = [options, &context] { return RunRenameCommand(*options, context); };
+}
+
+}  // namespace fotomill::cli

@@ -1,0 +1,342 @@
+#include "cli/commands/tdb.h"
+
+#include <atomic>
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "batch/ordered_run.h"
+#include "batch/picture_failure.h"
+#include "catalog/thumbnails/thumbnail_database.h"
+#include "catalog/thumbnails/thumbnail_file.h"
+#include "cli/frame/file_selection.h"
+#include "cli/frame/options.h"
+#include "cli/frame/result_output.h"
+#include "cli/frame/used_files.h"
+#include "platform/files.h"
+#include "platform/folders.h"
+#include "platform/process.h"
+
+namespace fotomill::cli {
+
+namespace {
+
+struct TdbOptions {
+  SelectionOptions selection;
+  std::string out;
+  std::string overwrite = "refuse";
+  int32_t jobs = 0;
+  bool purge = false;
+  bool dryRun = false;
+  bool json = false;
+};
+
+constexpr const char* kNoDatabase = "It is no thumbnail database that can be read, so it was left as it is.";
+constexpr const char* kNotAdded = "The thumbnail could not be added to the database.";
+constexpr size_t kAddedAtOnce = 64;  // pictures, about 2 MB
+
+// Opens a database. False after a message.
+bool OpenDatabase(ThumbnailDatabase& database, const std::string& path, bool create, ResultOutput& output) {
+  switch (database.OpenThumbnailDatabase(path, create)) {
+    case ThumbnailDatabase::Opened::Done: return true;
+    case ThumbnailDatabase::Opened::Missing: output.Failure(path, Status::FileOpenError); break;
+    case ThumbnailDatabase::Opened::NotRead: output.Failure(path, Status::DamagedFile, kNoDatabase); break;
+    case ThumbnailDatabase::Opened::Failed: output.Failure(path, Status::ErrorCreatingFile); break;
+  }
+  return false;
+}
+
+// A picture's record, made on any thread.
+struct Adding {
+  Status status = Status::Ok;
+  std::string hint;
+  std::unique_ptr<DatabaseRecord> record;
+};
+
+Adding MakeRecord(const SelectedFile& file) {
+  Adding adding{file.status, file.hint, std::make_unique<DatabaseRecord>()};
+  if (adding.status != Status::Ok) return adding;
+  adding.record->path = platform::AbsolutePath(file.name);
+  if (adding.record->path.size() > PathText::Capacity()) {
+    adding.status = Status::InvalidDestination;
+    adding.hint = "Its path is longer than 260 characters.";
+    return adding;
+  }
+  adding.status = MakeThumbnailOfFile(file.name, adding.record->thumbnail);
+  adding.record->volume = VolumeKeyFor(adding.record->path);
+  return adding;
+}
+
+// Appends records a few dozens at a time, as each time waits for the disk.
+class Appending {
+ public:
+  Appending(ThumbnailDatabase& database, ResultOutput& output) : database_(database), output_(output) {}
+
+  void Add(const SelectedFile& file, Adding& adding) {
+    if (adding.status != Status::Ok) {
+      Flush();
+      output_.Failure(file.name, adding.status, adding.hint.empty() ? OpenHint(file.name, adding.status) : adding.hint);
+      return;
+    }
+    names_.push_back(file.name);
+    records_.push_back(std::move(*adding.record));
+    if (records_.size() == kAddedAtOnce) Flush();
+  }
+
+  void Flush() {
+    const bool added = records_.empty() || database_.AppendDatabaseRecords(records_, true);
+    for (const std::string& name : names_) {
+      if (!added) {
+        output_.Failure(name, Status::ErrorWritingFile, kNotAdded);
+        continue;
+      }
+      output_.CountFile();
+      used_.Add(name);
+      output_.Line(output_.Shown(name));
+    }
+    names_.clear();
+    records_.clear();
+  }
+
+ private:
+  ThumbnailDatabase& database_;
+  ResultOutput& output_;
+  UsedFiles used_{FileFunction::Catalog};
+  std::vector<std::string> names_;
+  std::vector<DatabaseRecord> records_;
+};
+
+int AddFiles(const std::vector<SelectedFile>& files, uint32_t jobs, ThumbnailDatabase& database, ResultOutput& output) {
+  Appending appending(database, output);
+  std::vector<Adding> addings(files.size());
+  std::atomic<bool> goesOn = true;
+  OrderedRun run({
+      .work = [&](size_t item) { addings[item] = MakeRecord(files[item]); },
+      .deliver =
+          [&](size_t item) {
+            appending.Add(files[item], addings[item]);
+            addings[item].record.reset();
+            output.ShowProgress(item + 1, files.size());
+            goesOn = output.GoesOn();
+          },
+      .goesOn = [&] { return goesOn && platform::PendingExit() == 0; },
+      .tick = [&] { output.Tick(); },
+  });
+  run.Run(files.size(), jobs);
+  appending.Flush();
+  return output.Finish();
+}
+
+int RunAdd(const TdbOptions& options, CommandContext& context) {
+  const std::string path = context.names.values[0];
+  context.names.values.erase(context.names.values.begin());
+  const auto files = SelectFiles(options.selection, context);
+  if (!files) return kExitUsage;
+  ResultOutput output(context, false);
+  if (options.dryRun) {
+    for (const SelectedFile& file : *files) {
+      if (file.status != Status::Ok) {
+        output.Failure(file.name, file.status, file.hint);
+        continue;
+      }
+      output.CountFile();
+      output.Line(output.Shown(file.name));
+    }
+    return output.Finish();
+  }
+  ThumbnailDatabase database;
+  if (!OpenDatabase(database, path, true, output)) return output.Finish();
+  const uint32_t jobs = options.jobs == 0 ? platform::CoreCount() : static_cast<uint32_t>(options.jobs);
+  return AddFiles(*files, jobs, database, output);
+}
+
+int RunFind(const TdbOptions& options, CommandContext& context) {
+  const std::string &path = context.names.values[0], &name = context.names.values[1];
+  ResultOutput output(context, false);
+  ThumbnailDatabase database;
+  if (!OpenDatabase(database, path, false, output)) return output.Finish();
+  const std::string picture = platform::AbsolutePath(name);
+  ThumbnailRecord record;
+  if (!database.Find(picture, VolumeKeyFor(picture), record)) {
+    output.Failure(name, Status::NoImages, "The database has no thumbnail of it.");
+    return output.Finish();
+  }
+  if (options.overwrite != "replace" && platform::FileExists(options.out)) {
+    output.Failure(options.out, Status::ErrorCreatingFile, "The file is there; --overwrite replace replaces it.");
+    return output.Finish();
+  }
+  if (!WriteThumbnailFile(record, options.out)) {
+    output.Failure(options.out, Status::ErrorCreatingFile);
+    return output.Finish();
+  }
+  output.CountFile();
+  output.Line(output.Shown(name) + " -> " + output.Shown(options.out));
+  return output.Finish();
+}
+
+void PrintJson(const CommandContext& context, const ThumbnailDatabase& database, const DatabaseHeader& header) {
+  Json object{{"version", header.version}, {"count", header.count}, {"created", header.created}, {"appended", header.appended}};
+  object["records"] = Json::array();
+  DatabaseKey key;
+  for (int64_t i = 0; i < database.RecordCount(header); ++i) {
+    if (!database.ReadKey(i, key)) continue;
+    Json record{{"index", i}};
+    PutName(record, "path", key.path);
+    PutName(record, "volume", key.volume);
+    record["deleted"] = key.deleted;
+    object["records"].push_back(std::move(record));
+  }
+  const std::string text = object.dump(-1, ' ', true, Json::error_handler_t::replace) + "\n";
+  std::fwrite(text.data(), 1, text.size(), context.io.out);
+}
+
+int RunList(const TdbOptions& options, CommandContext& context) {
+  const std::string& path = context.names.values[0];
+  ResultOutput output(context, false);
+  ThumbnailDatabase database;
+  DatabaseHeader header;
+  if (!OpenDatabase(database, path, false, output)) return output.Finish();
+  if (!database.ReadDatabaseHeader(header)) {
+    output.Failure(path, Status::DamagedFile, kNoDatabase);
+    return output.Finish();
+  }
+  if (header.count != database.RecordCount(header)) {
+    output.Note(output.ShownMessage(path) + ": Its header counts " + std::to_string(header.count) + " records, the file holds " +
+                std::to_string(database.RecordCount(header)) + ".");
+  }
+  if (options.json) {
+    PrintJson(context, database, header);
+    return kExitOk;
+  }
+  DatabaseKey key;
+  for (int64_t i = 0; i < database.RecordCount(header) && output.GoesOn(); ++i) {
+    if (!database.ReadKey(i, key)) continue;
+    output.Line(std::to_string(i) + "\t" + (key.deleted ? "deleted" : "live") + "\t" + output.Shown(key.volume) + "\t" +
+                output.Shown(key.path));
+  }
+  return kExitOk;
+}
+
+// How many records a test picks out.
+template <typename Test>
+int64_t CountRecords(const ThumbnailDatabase& database, Test test) {
+  DatabaseHeader header;
+  DatabaseKey key;
+  int64_t count = 0;
+  const int64_t records = database.ReadDatabaseHeader(header) ? database.RecordCount(header) : 0;
+  for (int64_t i = 0; i < records; ++i) count += database.ReadKey(i, key) && test(key);
+  return count;
+}
+
+int RunDelete(const TdbOptions& options, CommandContext& context) {
+  const std::string& path = context.names.values[0];
+  ResultOutput output(context, false);
+  ThumbnailDatabase database;
+  if (!OpenDatabase(database, path, false, output)) return output.Finish();
+  for (size_t i = 1; i < context.names.values.size() && output.GoesOn(); ++i) {
+    const std::string& name = context.names.values[i];
+    const std::string picture = platform::AbsolutePath(name);
+    const int64_t deleted =
+        options.dryRun ? CountRecords(database, [&](const DatabaseKey& key) { return !key.deleted && key.path == picture; })
+                       : database.Delete(picture);
+    if (deleted < 1) {
+      output.Failure(name, deleted == 0 ? Status::NoImages : Status::ErrorWritingFile,
+                     deleted == 0 ? "The database has no thumbnail of it." : "");
+      continue;
+    }
+    output.CountFile();
+    output.Line(output.Shown(name));
+  }
+  return output.Finish();
+}
+
+class CompactionProgress : public ProgressSink {
+ public:
+  explicit CompactionProgress(ResultOutput& output) : output_(output) {}
+  void Step(int32_t done, int32_t total) override {
+    output_.ShowProgress(static_cast<uint64_t>(done), static_cast<uint64_t>(total));
+  }
+
+ private:
+  ResultOutput& output_;
+};
+
+int RunCompact(const TdbOptions& options, CommandContext& context) {
+  const std::string& path = context.names.values[0];
+  ResultOutput output(context, false);
+  ThumbnailDatabase database;
+  DatabaseHeader before, after;
+  if (!OpenDatabase(database, path, false, output)) return output.Finish();
+  const bool read = database.ReadDatabaseHeader(before);
+  if (options.dryRun) {
+    const int64_t kept = CountRecords(database, [&](const DatabaseKey& key) {
+      return !key.deleted && !(options.purge && !platform::FileExists(key.path) && PurgesMissing(key));
+    });
+    output.Line(std::to_string(before.count) + " -> " + std::to_string(kept) + " records");
+    return kExitOk;
+  }
+  CompactionProgress progress(output);
+  const ThumbnailDatabase::Compacted result =
+      read ? database.CompactThumbnailDatabase(options.purge, &progress) : ThumbnailDatabase::Compacted::NotRead;
+  if (result == ThumbnailDatabase::Compacted::Done && database.ReadDatabaseHeader(after)) {
+    output.Line(std::to_string(before.count) + " -> " + std::to_string(after.count) + " records");
+    return kExitOk;
+  }
+  const bool unread = result == ThumbnailDatabase::Compacted::NotRead;
+  output.Failure(path, unread ? Status::FileReadError : Status::ErrorWritingFile, "The database stays as it was.");
+  return kExitFailed;
+}
+
+using Run = int (*)(const TdbOptions& options, CommandContext& context);
+
+std::shared_ptr<TdbOptions> SetUp(CLI::App& app, CommandContext& context, Run run, const char* text) {
+  auto options = std::make_shared<TdbOptions>();
+  SetFooter(app, text);
+  context.run = [options, &context, run] { return run(*options, context); };
+  return options;
+}
+
+}  // namespace
+
+void SetUpTdbAdd(CLI::App& app, CommandContext& context) {
+  const auto options = SetUp(app, context, RunAdd,
+                             "A database that is missing is made. A picture that is there already gets a new record, and the "
+                             "earlier one is marked deleted.\n\nExample: fotomill tdb add Fotomill.tdb holiday --recursive");
+  AddSelection(app, options->selection, context);
+  context.names.Declare("DB FILE...", "The database, and pictures or folders of pictures", 1);
+  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, 256, "Pictures in work at once; 0, the default, is one a core");
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would be added");
+}
+
+void SetUpTdbFind(CLI::App& app, CommandContext& context) {
+  const auto options = SetUp(app, context, RunFind, "Example: fotomill tdb find Fotomill.tdb holiday/beach.jpg --out beach.THN");
+  context.names.Declare("DB PATH", "The database, and the picture whose thumbnail is wanted", 2, 2);
+  Require(AddName(app, "-o,--out", options->out, "FILE.THN", "The thumbnail file to write"));
+  AddChoice(app, "--overwrite", options->overwrite, "HOW", {"refuse", "replace"},
+            "When FILE.THN is there: refuse (the default) or replace");
+}
+
+void SetUpTdbList(CLI::App& app, CommandContext& context) {
+  const auto options = SetUp(app, context, RunList, "Example: fotomill tdb list Fotomill.tdb --json");
+  context.names.Declare("DB", "The database", 1, 1);
+  AddFlag(app, "--json", options->json,
+          "One JSON object {version, count, created, appended, records: [{index, path, volume, deleted}]}");
+}
+
+void SetUpTdbDelete(CLI::App& app, CommandContext& context) {
+  const auto options = SetUp(app, context, RunDelete,
+                             "Records are marked only; compact takes them out.\n\n"
+                             "Example: fotomill tdb delete Fotomill.tdb holiday/beach.jpg");
+  context.names.Declare("DB PATH...", "The database, and pictures whose thumbnails are to go", 2);
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would be deleted");
+}
+
+void SetUpTdbCompact(CLI::App& app, CommandContext& context) {
+  const auto options = SetUp(app, context, RunCompact, "Example: fotomill tdb compact Fotomill.tdb --purge");
+  context.names.Declare("DB", "The database", 1, 1);
+  AddFlag(app, "--purge", options->purge,
+          "Drop thumbnails of missing pictures as well, except on network, optical and removable drives");
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only print how many records would stay");
+}
+
+}  // namespace fotomill::cli

@@ -1,0 +1,13 @@
+#pragma once
+
+#include "cli/frame/command.h"
+
+namespace fotomill::cli {
+
+void SetUpTdbAdd(CLI::App& app, CommandContext& context);
+void SetUpTdbFind(CLI::App& app, CommandContext& context);
+void SetUpTdbList(CLI::App& app, CommandContext& context);
+void SetUpTdbDelete(CLI::App& app, CommandContext& context);
+void SetUpTdbCompact(CLI::App& app, CommandContext& context);
+
+}  // namespace fotomill::cli

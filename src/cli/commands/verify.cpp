@@ -1,0 +1,85 @@
+#include "cli/commands/verify.h"
+
+#include <memory>
+#include <string>
+
+#include "batch/picture_failure.h"
+#include "cli/frame/file_selection.h"
+#include "cli/frame/options.h"
+#include "cli/frame/result_output.h"
+#include "cli/frame/used_files.h"
+#include "registry/registry.h"
+
+namespace fotomill::cli {
+
+namespace {
+
+struct VerifyOptions {
+  SelectionOptions selection;
+  bool json = false;
+};
+
+// Decodes every frame of an animation.
+Status VerifyFrames(const std::string& name) {
+  AnimationPointer animation;
+  Status status = OpenAnimation(name.c_str(), animation);
+  while (status == Status::Ok) status = animation->Next();
+  return status == Status::NoImages ? Status::Ok : status;
+}
+
+// Decodes every page of a file.
+Status VerifyFile(const std::string& name, std::string& hint) {
+  int32_t pages = 1;
+  for (int32_t page = 0; page < pages; ++page) {
+    PicturePointer picture;
+    RETURN_IF_BAD(LoadPictureInfo(name.c_str(), picture));
+    picture->page = page;
+    pages = picture->pageCount;
+    RETURN_IF_BAD(ReadPicture(*picture));
+    if (!picture->warning.empty()) {  // it can be shown, but it is not what was saved
+      hint = picture->warning.view();
+      return Status::DamagedFile;
+    }
+    if (pages > 1 && FormatRow(picture->formatIndex).animate != nullptr) return VerifyFrames(name);
+  }
+  return Status::Ok;
+}
+
+int RunVerify(const VerifyOptions& options, const CommandContext& context) {
+  const auto files = SelectFiles(options.selection, context);
+  if (!files) return kExitUsage;
+  ResultOutput output(context, options.json);
+  output.Expect(files->size());
+  UsedFiles used(FileFunction::View);
+  for (const SelectedFile& file : *files) {
+    if (!output.GoesOn()) break;
+    std::string hint = file.hint;
+    const Status status = file.status == Status::Ok ? VerifyFile(file.name, hint) : file.status;
+    if (output.IsJson()) {
+      Json element;
+      PutName(element, "file", file.name);
+      PutStatus(element, status);
+      output.Element(element);
+    }
+    if (status != Status::Ok) {
+      output.Failure(file.name, status, hint.empty() ? OpenHint(file.name, status) : hint);
+      continue;
+    }
+    output.CountFile();
+    used.Add(file.name);
+    if (!output.IsJson()) output.Line(output.Shown(file.name) + ": " + std::string(StatusMessage(status)));
+  }
+  return output.Finish();
+}
+
+}  // namespace
+
+void SetUpVerify(CLI::App& app, CommandContext& context) {
+  auto options = std::make_shared<VerifyOptions>();
+  AddSelection(app, options->selection, context);
+  AddFlag(app, "--json", options->json, "One JSON array of {file, status, message}");
+  SetFooter(app, "Every page of every file is decoded in full; nothing is written.\n\nExample: fotomill verify -r holiday");
+  context.run = [options, &context] { return RunVerify(*options, context); };
+}
+
+}  // namespace fotomill::cli

@@ -1,0 +1,31 @@
+#pragma once
+
+#include <CLI/CLI.hpp>
+#include <string>
+#include <vector>
+
+#include "cli/frame/command.h"
+
+namespace fotomill::cli {
+
+// The parser of one command: its options and the global ones by CLI11, its names by itself, byte for byte as typed.
+class CommandParser : public CLI::App {
+ public:
+  // `command` may be null: then there are the global options only. `context` outlives the parser.
+  CommandParser(const Command* command, CommandContext& context);
+
+  // Fills the options and context.names. Throws CLI::ParseError, CLI::CallForHelp for -h among them.
+  void ParseArguments(std::vector<std::string> arguments);
+  std::string HelpPage() const;
+
+ private:
+  void TakeNames();
+  [[noreturn]] void RefuseOption(const std::string& typed) const;
+
+  CommandContext& context_;
+};
+
+// Whether an option that stands before the command takes the next argument as its value.
+bool GlobalOptionTakesValue(std::string_view option);
+
+}  // namespace fotomill::cli

@@ -1,0 +1,9 @@
+#pragma once
+
+#include "cli/frame/command.h"
+
+namespace fotomill::cli {
+
+void SetUpCompletion(CLI::App& app, CommandContext& context);
+
+}  // namespace fotomill::cli

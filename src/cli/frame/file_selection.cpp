@@ -1,0 +1,126 @@
+#include "cli/frame/file_selection.h"
+
+#include <set>
+#include <utility>
+
+#include "cli/frame/options.h"
+#include "core/limits.h"
+#include "platform/files.h"
+#include "platform/paths.h"
+#include "registry/registry.h"
+
+namespace fotomill::cli {
+
+namespace {
+
+constexpr int kDeepestFolder = 64;
+
+// Everything from a stream, up to the limit of list files; false when there is more or it cannot be read.
+bool ReadStream(std::FILE* stream, std::string& contents) {
+  char buffer[16384];
+  while (const size_t count = std::fread(buffer, 1, sizeof buffer, stream)) {
+    contents.append(buffer, count);
+    if (contents.size() > limits.listFileBytes) return false;
+  }
+  return std::ferror(stream) == 0;
+}
+
+std::vector<std::string> SplitList(std::string_view list, char end) {
+  std::vector<std::string> names;
+  while (!list.empty()) {
+    const size_t place = list.find(end);
+    if (place != 0) names.emplace_back(list.substr(0, place));
+    list.remove_prefix(place == std::string_view::npos ? list.size() : place + 1);
+  }
+  return names;
+}
+
+class Selector {
+ public:
+  explicit Selector(bool recursive) : recursive_(recursive) {}
+
+  void Add(const std::string& name) {
+    const platform::FileFacts facts = platform::FactsOf(name);
+    if (facts.kind == platform::FileKind::Folder) {
+      trail_.clear();
+      trail_.insert({facts.device, facts.identity});
+      AddFolder(name, {}, 0);
+    } else if (facts.kind == platform::FileKind::Missing) {
+      files_.push_back({name, {}, Status::FileOpenError, "There is no such file."});
+    } else {
+      files_.push_back({name, {}, Status::Ok, {}});
+    }
+  }
+  std::vector<SelectedFile> Take() { return std::move(files_); }
+
+ private:
+  void AddFolder(const std::string& folder, const std::string& below, int depth) {
+    const auto entries = platform::ListFolder(folder);
+    if (!entries) {
+      files_.push_back({folder, below, Status::FileOpenError, "The folder cannot be read."});
+      return;
+    }
+    for (const platform::FolderEntry& entry : *entries) {
+      const std::string path = platform::JoinFolder(folder, entry.name);
+      if (entry.kind == platform::FileKind::Folder) {
+        if (recursive_ && !entry.link) Descend(path, platform::JoinFolder(below, entry.name), depth + 1);
+      } else if (FindFormatByName(entry.name) != kNoFormat && IsFile(entry, path)) {
+        files_.push_back({path, below, Status::Ok, {}});
+      }
+    }
+  }
+
+  static bool IsFile(const platform::FolderEntry& entry, const std::string& path) {
+    return entry.kind == platform::FileKind::Regular || (entry.link && platform::IsRegularFile(path));
+  }
+
+  // A folder that is among its own parents, as mounts can make it, is left alone.
+  void Descend(const std::string& folder, const std::string& below, int depth) {
+    if (depth > kDeepestFolder) {
+      files_.push_back({folder, below, Status::FileOpenError, "The folders are nested too deeply."});
+      return;
+    }
+    const platform::FileFacts facts = platform::FactsOf(folder);
+    const auto [place, fresh] = trail_.insert({facts.device, facts.identity});
+    if (!fresh) return;
+    AddFolder(folder, below, depth);
+    trail_.erase(place);
+  }
+
+  const bool recursive_;
+  std::set<std::pair<uint64_t, uint64_t>> trail_;  // the folder that is being read and its parents
+  std::vector<SelectedFile> files_;
+};
+
+}  // namespace
+
+void AddSelection(CLI::App& app, SelectionOptions& options, CommandContext& context) {
+  context.names.Declare("FILE...", "Pictures, and folders whose pictures are meant", 0);
+  AddFlag(app, "-r,--recursive", options.recursive, "Take the folders in named folders as well");
+  AddName(app, "--files-from", options.filesFrom, "FILE|-", "Take names from a file, one a line; - is the standard input");
+  AddFlag(app, "-0,--null", options.zeroTerminated, "Names in that file end in a zero byte instead");
+}
+
+std::optional<std::vector<SelectedFile>> SelectFiles(const SelectionOptions& options, const CommandContext& context) {
+  Selector selector(options.recursive);
+  std::string list;
+  if (options.filesFrom == "-") {
+    if (!ReadStream(context.io.in, list)) {
+      UsageError(context, "The list of names on the standard input cannot be read.");
+      return std::nullopt;
+    }
+  } else if (!options.filesFrom.empty()) {
+    if (platform::ReadWholeFile(options.filesFrom, limits.listFileBytes, list) != platform::ReadResult::Done) {
+      UsageError(context, "The list of names \"" + options.filesFrom + "\" cannot be read.");
+      return std::nullopt;
+    }
+  } else if (context.names.values.empty()) {
+    UsageError(context, "No files are named.");
+    return std::nullopt;
+  }
+  for (const std::string& name : context.names.values) selector.Add(name);
+  for (const std::string& name : SplitList(list, options.zeroTerminated ? '\0' : '\n')) selector.Add(name);
+  return selector.Take();
+}
+
+}  // namespace fotomill::cli

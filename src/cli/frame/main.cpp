@@ -1,0 +1,20 @@
+#include <cstdio>
+
+#include "cli/frame/command.h"
+#include "platform/memory.h"
+#include "platform/process.h"
+
+int main(int count, char** arguments) {
+  using namespace fotomill;
+  platform::FillStandardStreams();
+  platform::CatchTermination();
+  platform::KeepFreedMemory();
+  cli::Io io;
+  io.inTerminal = platform::IsTerminal(0);
+  io.outTerminal = platform::IsTerminal(1);
+  io.outStored = platform::IsStored(1);
+  static char buffer[64 * 1024];  // lives as long as the stream
+  if (io.outStored) std::setvbuf(io.out, buffer, _IOFBF, sizeof buffer);
+  io.errTerminal = platform::IsTerminal(2);
+  return cli::RunCommandLine(count, arguments, io);
+}

@@ -1,0 +1,33 @@
+#include "cli/frame/prepare.h"
+
+#include <string_view>
+
+#include "core/data_folder.h"
+#include "plugins/plugin_table.h"
+#include "registry/registry.h"
+#include "settings/configuration.h"
+#include "settings/format_switches.h"
+
+namespace fotomill::cli {
+
+std::string PrepareFor(const Command& command, const GlobalOptions& global) {
+  if (command.needs == Needs::Nothing) return {};
+  SetDataFolder(global.dataFolder);
+  (void)LoadConfiguration();  // a file that is missing or cannot be read leaves the defaults
+  for (const std::string_view setting : global.settings) {
+    const size_t equals = setting.find('=');
+    if (equals == std::string_view::npos) return "--set takes KEY=VALUE, not \"" + std::string(setting) + "\".";
+    const SetResult result = SetSetting(setting.substr(0, equals), setting.substr(equals + 1));
+    if (!result.Ok()) return "--set: " + result.message;
+  }
+  if (command.needs == Needs::Formats) TakeFormatSwitches();
+  if (command.needs == Needs::Formats) RunFormatStartup();
+  if (command.needs == Needs::Formats && !global.noPlugins) EnablePlugins();
+  return {};
+}
+
+void FinishAfter(const Command& command) {
+  if (command.needs == Needs::Formats) RunFormatShutdown();
+}
+
+}  // namespace fotomill::cli

@@ -1,0 +1,173 @@
+#include <cstdlib>
+#include <exception>
+#include <new>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "cli/frame/command_parser.h"
+#include "cli/frame/commands.h"
+#include "cli/frame/help.h"
+#include "cli/frame/prepare.h"
+#include "core/nearest_name.h"
+#include "core/shown_text.h"
+#include "platform/process.h"
+
+namespace fotomill::cli {
+
+namespace {
+
+using Arguments = std::vector<std::string>;
+
+void Print(std::FILE* stream, std::string_view text) { std::fwrite(text.data(), 1, text.size(), stream); }
+
+int Complain(const Io& io, const std::string& message, const std::string& topic = {}) {
+  Print(io.err, "fotomill: " + (io.errTerminal ? EscapeControls(message) : message) + "\nTry \"fotomill help" +
+                    (topic.empty() ? "" : " " + topic) + "\".\n");
+  return kExitUsage;
+}
+
+// The place of the first argument from `from` on that is a word, options and their values left out.
+std::optional<size_t> FindWord(const Arguments& arguments, size_t from) {
+  for (size_t i = from; i < arguments.size(); ++i) {
+    if (arguments[i] == "--") return i + 1 < arguments.size() ? std::optional(i + 1) : std::nullopt;
+    if (arguments[i].empty() || arguments[i][0] != '-') return i;
+    if (GlobalOptionTakesValue(arguments[i])) ++i;
+  }
+  return std::nullopt;
+}
+
+bool IsAnyOf(const std::string& argument, std::string_view shortForm, std::string_view longForm) {
+  return argument == shortForm || argument == longForm;
+}
+
+// What the named command is called, with its second word where it has one, and the places of those words.
+struct CommandName {
+  std::string name;
+  std::vector<size_t> places;
+};
+
+bool BeginsCommandGroup(const std::string& word) {
+  for (const Command& command : Commands()) {
+    if (std::string_view(command.name).starts_with(word + " ")) return true;
+  }
+  return false;
+}
+
+CommandName NameOfCommand(const Arguments& arguments, size_t place) {
+  CommandName result{arguments[place], {place}};
+  if (FindCommand(result.name) != nullptr || !BeginsCommandGroup(result.name)) return result;
+  if (const auto second = FindWord(arguments, place + 1)) {
+    result.name += " " + arguments[*second];
+    result.places.push_back(*second);
+  }
+  return result;
+}
+
+int RefuseCommand(const std::string& name, const Io& io) {
+  std::vector<std::string_view> names{"help"};
+  for (const Command& command : Commands()) names.emplace_back(command.name);
+  return Complain(io, "There is no command \"" + name + "\"." + NearestNameHint(name, names));
+}
+
+int PrintHelp(const Arguments& words, const Io& io) {
+  std::string topic;
+  for (const std::string& word : words) {
+    if (!word.empty() && word[0] != '-') topic += (topic.empty() ? "" : " ") + word;
+  }
+  const std::string page = topic.empty() || topic == "help" ? MainHelp() : HelpOf(topic);
+  if (page.empty()) return RefuseCommand(topic, io);
+  Print(io.out, page);
+  return kExitOk;
+}
+
+// Parses the arguments of `command` (null: global options only) and runs it.
+int ParseAndRun(const Command* command, const Arguments& arguments, const Io& io) {
+  CommandContext context;
+  context.io = io;
+  CommandParser parser(command, context);
+  try {
+    parser.ParseArguments(arguments);
+  } catch (const CLI::CallForHelp&) {
+    Print(io.out, command == nullptr ? MainHelp() : parser.HelpPage());
+    return kExitOk;
+  } catch (const CLI::ParseError& error) {
+    return Complain(io, (command == nullptr ? "" : std::string(command->name) + ": ") + error.what(),
+                    command == nullptr ? "" : command->name);
+  }
+  if (command == nullptr) return Complain(io, "A command is missing.");
+  const std::string problem = PrepareFor(*command, context.global);
+  if (!problem.empty()) return Complain(io, std::string(command->name) + ": " + problem, command->name);
+  const int status = context.run();
+  FinishAfter(*command);
+  return status;
+}
+
+int Dispatch(Arguments arguments, const Io& io) {
+  const std::optional<size_t> place = FindWord(arguments, 0);
+  for (size_t i = 0; i < place.value_or(arguments.size()); ++i) {
+    if (arguments[i] == "--") break;
+    if (GlobalOptionTakesValue(arguments[i])) {
+      ++i;
+    } else if (IsAnyOf(arguments[i], "-V", "--version")) {
+      Print(io.out, VersionPage());
+      return kExitOk;
+    } else if (!place && IsAnyOf(arguments[i], "-h", "--help")) {
+      Print(io.out, MainHelp());
+      return kExitOk;
+    }
+  }
+  if (!place && arguments.empty()) {
+    Print(io.err, MainHelp());
+    return kExitUsage;
+  }
+  if (!place) return ParseAndRun(nullptr, arguments, io);
+  if (arguments[*place] == "help")
+    return PrintHelp({arguments.begin() + static_cast<ptrdiff_t>(*place) + 1, arguments.end()}, io);
+
+  const CommandName named = NameOfCommand(arguments, *place);
+  const Command* command = FindCommand(named.name);
+  if (command == nullptr && named.places.size() == 1 && BeginsCommandGroup(named.name)) {
+    const std::string page = HelpOf(named.name);
+    const bool asked = arguments.size() > *place + 1 && IsAnyOf(arguments[*place + 1], "-h", "--help");
+    Print(asked ? io.out : io.err, page);
+    return asked ? kExitOk : kExitUsage;
+  }
+  if (command == nullptr) return RefuseCommand(named.name, io);
+  for (auto word = named.places.rbegin(); word != named.places.rend(); ++word) {
+    arguments.erase(arguments.begin() + static_cast<ptrdiff_t>(*word));
+  }
+  return ParseAndRun(command, arguments, io);
+}
+
+}  // namespace
+
+bool CommandContext::ColorOn(bool terminal) const {
+  if (global.color != "auto") return global.color == "always";
+  const char* noColor = std::getenv("NO_COLOR");
+  return terminal && (noColor == nullptr || *noColor == '\0');
+}
+
+int UsageError(const CommandContext& context, std::string_view message) {
+  const std::string name = context.command->name;
+  return Complain(context.io, name + ": " + std::string(message), name);
+}
+
+int RunCommandLine(int count, const char* const* arguments, const Io& io) {
+  int status = kExitFailed;
+  try {
+    status = Dispatch(Arguments(arguments + (count > 0 ? 1 : 0), arguments + count), io);
+  } catch (const std::bad_alloc&) {
+    Print(io.err, "fotomill: Memory allocation error.\n");
+  } catch (const std::exception& error) {
+    Print(io.err, std::string("fotomill: ") + error.what() + "\n");
+  }
+  if (std::fflush(io.out) != 0 || std::ferror(io.out) != 0) {
+    Print(io.err, "fotomill: The results could not be written.\n");
+    if (status == kExitOk) status = kExitFailed;
+  }
+  const int asked = platform::PendingExit();
+  return asked != 0 ? asked : status;
+}
+
+}  // namespace fotomill::cli

@@ -1,0 +1,37 @@
+#include "cli/frame/terminal_box.h"
+
+namespace fotomill::cli {
+
+void TerminalBox::ShowLine(const ProgressLine& line, const FileOutcome* outcome) {
+  if (outcome == nullptr) {  // a closing line
+    output_.EndArray();
+    return output_.Note(line.text);
+  }
+  const std::string name = output_.ShownMessage(outcome->source) + ": ";
+  if (output_.IsJson()) ShowElement(*outcome);
+  if (outcome->skipped) {
+    const std::string text = name + output_.ShownMessage(outcome->hint);
+    return outcome->status == Status::Ok ? output_.Note(text) : output_.Message(text);
+  }
+  if (outcome->status != Status::Ok) return output_.Failure(outcome->source, outcome->status, outcome->hint);
+  if (!output_.IsJson()) output_.Line(output_.Shown(outcome->source) + " -> " + output_.Shown(outcome->destination));
+  if (tellReplaced_ && outcome->replaced) output_.Note(name + "replaced " + output_.ShownMessage(outcome->destination) + ".");
+  if (verbose_ && !outcome->note.empty()) output_.Note(name + outcome->note);
+}
+
+void TerminalBox::ShowElement(const FileOutcome& outcome) {
+  Json element;
+  PutName(element, "file", outcome.source);
+  PutName(element, "destination", outcome.status == Status::Ok ? outcome.destination : std::string());
+  PutStatus(element, outcome.status);
+  if (outcome.skipped) element["skipped"] = true;
+  if (!outcome.note.empty()) element["note"] = outcome.note;
+  output_.Element(element);
+}
+
+int FinishBatch(const BatchJob& job) {
+  if (!job.uses.empty()) (void)UpdateFileHistory(job.uses);  // a history that cannot be written is no failure
+  return job.errors || job.writeAborts > 0 ? kExitFailed : kExitOk;
+}
+
+}  // namespace fotomill::cli

@@ -1,9 +1,0 @@
-#pragma once
-
-#include "cli/command.h"
-
-namespace fotomill::cli {
-
-void SetUpTurn(CLI::App& app, CommandContext& context);
-
-}  // namespace fotomill::cli

@@ -1,0 +1,156 @@
+// A JPEG file's segments: FF, a marker byte, a length of two bytes that counts itself, data. Any number of FF may stand in
+// front of a marker; markers 01 and D0 to D8 have neither length nor data.
+//
+//   E0 "JFIF\0" version (2 bytes), unit, resolutions across and down (2 bytes each), width and height of a thumbnail (1 byte
+//      each), the thumbnail
+//   E0 "JFXX\0" a thumbnail in another form
+// Source: ITU-T T.81 (1992), annex B; T.871 (2011).
+#include "containers/jpeg_segments.h"
+
+#include <algorithm>
+
+#include "core/byte_reader.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr uint8_t kApp0 = 0xE0, kApp1 = 0xE1, kApp2 = 0xE2, kApp15 = 0xEF, kComment = 0xFE;
+constexpr uint8_t kBegin = 0xD8, kEnd = 0xD9, kScan = 0xDA;
+constexpr std::string_view kJfifHead("JFIF\0", 5), kJfxxHead("JFXX\0", 5), kMpfHead("MPF\0", 4);
+constexpr size_t kJfifSize = 14, kJfifAcross = 8, kJfifThumbnail = 12;
+
+bool StandsAlone(uint8_t marker) { return marker == 0x01 || (marker >= 0xD0 && marker <= 0xD8); }
+bool IsExif(const JpegSegment& segment) { return segment.marker == kApp1 && segment.Starts(kExifHead); }
+bool IsApplication(uint8_t marker) { return (marker >= kApp0 && marker <= kApp15) || marker == kComment; }
+
+void Append(std::vector<uint8_t>& bytes, std::span<const uint8_t> more) { bytes.insert(bytes.end(), more.begin(), more.end()); }
+
+void AppendSegment(std::vector<uint8_t>& bytes, uint8_t marker, std::string_view heading, std::span<const uint8_t> data) {
+  const size_t length = 2 + heading.size() + data.size();
+  Append(bytes, std::initializer_list<uint8_t>{0xFF, marker, static_cast<uint8_t>(length >> 8), static_cast<uint8_t>(length)});
+  bytes.insert(bytes.end(), heading.begin(), heading.end());
+  Append(bytes, data);
+}
+
+// JFIF's segment for pixels that were turned.
+void AppendJfif(std::vector<uint8_t>& bytes, std::span<const uint8_t> data, bool swapSides) {
+  std::vector<uint8_t> jfif(data.begin(), data.begin() + kJfifSize);
+  if (swapSides) std::swap_ranges(jfif.begin() + kJfifAcross, jfif.begin() + kJfifAcross + 2, jfif.begin() + kJfifAcross + 2);
+  jfif[kJfifThumbnail] = jfif[kJfifThumbnail + 1] = 0;
+  AppendSegment(bytes, kApp0, {}, jfif);
+}
+
+// Puts the segments of the new file together, in the order of the old one.
+class Assembly {
+ public:
+  Assembly(const JpegParts& parts, std::vector<uint8_t>& made) : parts_(parts), made_(made) {}
+
+  void Add(const JpegSegment& segment) {
+    const bool jfif = segment.marker == kApp0 && segment.Starts(kJfifHead);
+    if (!jfif) AddNew();  // behind JFIF's own, in front of everything else
+    if (IsExif(segment) && !parts_.exif.empty() && !exifDone_) {
+      Once(exifDone_, kExifHead, parts_.exif);
+    } else if (segment.marker == kApp1 && segment.Starts(kXmpHead) && !parts_.xmp.empty() && !xmpDone_) {
+      Once(xmpDone_, kXmpHead, parts_.xmp);
+    } else if (!parts_.pixels.empty() && jfif && segment.data.size() >= kJfifSize) {
+      AppendJfif(made_, segment.data, parts_.swapSides);
+    } else if (parts_.pixels.empty() || (IsApplication(segment.marker) && !IsOldThumbnail(segment))) {
+      Append(made_, segment.whole);
+    }
+  }
+  // EXIF and XMP that the old file has not.
+  void ExpectNone(bool exif, bool xmp) {
+    exifNew_ = exif;
+    xmpNew_ = xmp;
+  }
+  void AddNew() {
+    if (exifNew_) Once(exifDone_, kExifHead, parts_.exif);
+    if (xmpNew_) Once(xmpDone_, kXmpHead, parts_.xmp);
+    exifNew_ = xmpNew_ = false;
+  }
+
+ private:
+  static bool IsOldThumbnail(const JpegSegment& segment) { return segment.marker == kApp0 && segment.Starts(kJfxxHead); }
+  // Further segments may hold what has no room in the first; they stay.
+  void Once(bool& done, std::string_view heading, std::span<const uint8_t> data) {
+    if (!done) AppendSegment(made_, kApp1, heading, data);
+    done = true;
+  }
+
+  const JpegParts& parts_;
+  std::vector<uint8_t>& made_;
+  bool exifNew_ = false, xmpNew_ = false, exifDone_ = false, xmpDone_ = false;
+};
+
+}  // namespace
+
+bool JpegSegment::Starts(std::string_view head) const { return ByteReader(data).Match(head); }
+
+std::span<const uint8_t> JpegHead::Exif() const {
+  for (const JpegSegment& segment : segments) {
+    if (IsExif(segment)) return segment.data.subspan(kExifHead.size());
+  }
+  return {};
+}
+
+std::span<const uint8_t> JpegHead::Xmp() const {
+  for (const JpegSegment& segment : segments) {
+    if (segment.marker == kApp1 && segment.Starts(kXmpHead)) return segment.data.subspan(kXmpHead.size());
+  }
+  return {};
+}
+
+bool JpegHead::HasSplitExif() const { return std::ranges::count_if(segments, IsExif) > 1; }
+
+bool JpegHead::HasMorePictures() const {
+  return std::ranges::any_of(segments, [](const JpegSegment& s) { return s.marker == kApp2 && s.Starts(kMpfHead); });
+}
+
+Status ParseJpegHead(std::span<const uint8_t> file, JpegHead& head) {
+  head = {};
+  ByteReader bytes(file);
+  if (!bytes.Match("\xFF\xD8")) return Status::DamagedFile;
+  while (bytes.Ok()) {
+    const uint64_t start = bytes.Position();
+    if (bytes.U8() != 0xFF) return bytes.Ok() ? Status::DamagedFile : Status::FileReadError;
+    uint8_t marker = 0xFF;
+    while (marker == 0xFF && bytes.Ok()) marker = bytes.U8();
+    if (marker == 0 || marker == kEnd) return Status::DamagedFile;
+    if (marker == kScan) {
+      head.scan = start;
+      return bytes.Ok() ? Status::Ok : Status::FileReadError;
+    }
+    JpegSegment segment{.marker = marker, .data = {}, .whole = {}};
+    if (!StandsAlone(marker)) {
+      const uint16_t length = bytes.Be16();
+      if (length < 2 && bytes.Ok()) return Status::DamagedFile;
+      segment.data = bytes.Take(length < 2 ? 0u : length - 2u);
+    }
+    if (!bytes.Ok()) break;
+    segment.whole = file.subspan(start, bytes.Position() - start);
+    head.segments.push_back(segment);
+  }
+  return Status::FileReadError;
+}
+
+Status AssembleJpeg(std::span<const uint8_t> file, const JpegHead& head, const JpegParts& parts, std::vector<uint8_t>& made) {
+  if (parts.exif.size() > kMostExif || parts.xmp.size() > kMostXmp) return Status::UnsuitableImage;
+  made.clear();
+  made.reserve(file.size() + kMostSegment);
+  made.push_back(0xFF);
+  made.push_back(kBegin);
+  Assembly assembly(parts, made);
+  assembly.ExpectNone(!parts.exif.empty() && head.Exif().empty(), !parts.xmp.empty() && head.Xmp().empty());
+  for (const JpegSegment& segment : head.segments) assembly.Add(segment);
+  assembly.AddNew();
+  if (parts.pixels.empty()) {
+    Append(made, file.subspan(head.scan));
+  } else {
+    Append(made, parts.pixels.subspan(2));
+    Append(made, parts.rest);
+  }
+  return Status::Ok;
+}
+
+}  // namespace fotomill

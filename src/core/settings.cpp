@@ -1,8 +1,0 @@
-#include "core/settings.h"
-
-namespace fotomill {
-
-constinit Settings settings;
-constinit const Settings defaultSettings;
-
-}  // namespace fotomill

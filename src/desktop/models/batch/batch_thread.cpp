@@ -1,0 +1,198 @@
+#include "desktop/models/batch/batch_thread.h"
+
+#include "batch/abort.h"
+#include "core/choice_lists.h"
+#include "desktop/models/browser/browser_model.h"
+#include "desktop/models/thumbnails/thumbnail.h"
+#include "platform/files.h"
+#include "processing/geometry/scale.h"
+#include "settings/settings.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+constexpr int32_t kPreviewSide = 200;
+
+std::string DimensionsText(int32_t width, int32_t height, int32_t bits) {
+  return std::to_string(width) + " x " + std::to_string(height) + ", " + std::to_string(bits) + " bits";
+}
+
+// A copy of a picture that belongs to somebody else, scaled to a square.
+RgbImage SmallCopy(const PictureRecord& picture, int32_t side) {
+  PackedImage scaled, alpha;
+  RgbImage rgb;
+  const Size size = FitSize(picture.image.Width(), picture.image.Height(), side);
+  if (ScaleFiltered(picture.image, picture.alpha, size, ScaleFilter::Bilinear, scaled, alpha) != Status::Ok) return rgb;
+  PictureRecord small;
+  small.width = scaled.Width();
+  small.height = scaled.Height();
+  small.bitsPerPixel = scaled.Bits();
+  small.image = std::move(scaled);
+  small.alpha = std::move(alpha);
+  if (PrepareForDisplay(small, static_cast<Color>(settings.ThumbnailMatte)) == Status::Ok) (void)ToRgb(small.image, rgb);
+  return rgb;
+}
+
+}  // namespace
+
+OverwritePreview MakeOverwritePreview(const OverwriteQuestion& question, int32_t side) {
+  OverwritePreview preview;
+  const platform::FileFacts there = platform::FactsOf(question.path);
+  const ThumbnailPointer existing = LoadThumbnail({question.path, there.modified, there.size, side, choice::kVirtual});
+  preview.existing = existing->pixels;
+  preview.existingText = SizeText(there.size, choice::kSizeFitting) + "\n" + DateText(there.modified);
+  if (existing->width > 0)
+    preview.existingText.append("\n").append(DimensionsText(existing->width, existing->height, existing->bits));
+  if (question.picture == nullptr) return preview;
+  const PictureRecord& incoming = *question.picture;
+  if (!incoming.image.Empty()) preview.incoming = SmallCopy(incoming, side);
+  const platform::FileFacts source = platform::FactsOf(question.source);
+  preview.incomingText.append("From ").append(SizeText(source.size, choice::kSizeFitting)).append("\n");
+  preview.incomingText.append(DateText(source.modified)).append("\n");
+  preview.incomingText += DimensionsText(incoming.width, incoming.height, incoming.bitsPerPixel);
+  return preview;
+}
+
+// The batch's side of the progress box.
+class BatchThread::Box : public ProgressBox {
+ public:
+  explicit Box(BatchThread& batch) : batch_(batch) {}
+  bool Open(const ProgressModel&) override {
+    batch_.Tell([&windows = batch_.windows_] { windows.BatchOpened(); });
+    return true;
+  }
+  void ShowLine(const ProgressLine& line, const FileOutcome* outcome) override {
+    batch_.Tell([&windows = batch_.windows_, line, copy = outcome == nullptr ? FileOutcome() : *outcome] {
+      windows.BatchLine(line, copy);
+    });
+  }
+  void ShowStatus(const std::string& status) override {
+    batch_.Tell([&windows = batch_.windows_, status] { windows.BatchStatus(status); });
+  }
+  void ShowProgress(uint32_t done, uint32_t count) override {
+    batch_.Tell([&windows = batch_.windows_, done, count] { windows.BatchProgress(done, count); });
+  }
+  void StayOpen(const ProgressModel& model) override {
+    batch_.Tell([&windows = batch_.windows_, model] { windows.BatchStaysOpen(model); });
+  }
+  void Close(const ProgressModel&) override {
+    batch_.Tell([&windows = batch_.windows_] { windows.BatchCloses(); });
+  }
+
+ private:
+  BatchThread& batch_;
+};
+
+// The batch's side of the prompts.
+class BatchThread::Questions : public Prompts {
+ public:
+  explicit Questions(BatchThread& batch) : batch_(batch) {}
+  OverwriteAnswer AskOverwrite(const OverwriteQuestion& question) override {
+    OverwritePreview preview;
+    if (question.checks.previews) preview = MakeOverwritePreview(question, kPreviewSide);
+    OverwriteAnswer answer;
+    answer.skipRest = !batch_.AskWindow([&] { answer = batch_.windows_.AskOverwrite(question, preview); });
+    return answer;
+  }
+  std::optional<std::string> AskDestinationName(const NameQuestion& question) override {
+    std::optional<std::string> answer;
+    (void)batch_.AskWindow([&] { answer = batch_.windows_.AskDestinationName(question); });
+    return answer;
+  }
+  std::optional<std::string> AskPassword(const std::string& path) override {
+    std::optional<std::string> answer;
+    (void)batch_.AskWindow([&] { answer = batch_.windows_.AskPassword(path); });
+    return answer;
+  }
+  bool ConfirmFormat(const std::string& question) override {
+    bool confirmed = false;
+    (void)batch_.AskWindow([&] { confirmed = batch_.windows_.ConfirmFormat(question); });
+    return confirmed;
+  }
+  bool ConfirmNewFolder(const std::string& folder) override {
+    return Confirm(std::string("There is no folder \"").append(folder).append("\". Make it?"), "&Make it");
+  }
+  void StoreFlag(KeyNumber key, bool value) override {
+    batch_.Tell([&windows = batch_.windows_, key, value] { windows.StoreFlag(key, value); });
+  }
+
+ private:
+  bool Confirm(const std::string& question, const std::string& yes) {
+    bool confirmed = false;
+    (void)batch_.AskWindow([&] { confirmed = batch_.windows_.Confirm(question, yes); });
+    return confirmed;
+  }
+
+  BatchThread& batch_;
+};
+
+BatchThread::~BatchThread() {
+  if (!thread_.joinable()) return;
+  Abort();
+  {
+    const std::lock_guard lock(mutex_);
+    given_ = true;
+  }
+  answered_.notify_all();
+  thread_.join();
+}
+
+void BatchThread::Start(std::vector<BatchFile> files, BatchFunction function, BatchJob job) {
+  StartWork(std::move(job), [files = std::move(files), function = std::move(function)](BatchJob& running) {
+    return RunBatch(files, function, running);
+  });
+}
+
+void BatchThread::StartWork(BatchJob job, Work work) {
+  if (thread_.joinable()) thread_.join();
+  job_ = std::move(job);
+  running_ = true;
+  thread_ = std::thread([this, work = std::move(work)] {
+    Box box(*this);
+    Questions questions(*this);
+    job_.box = &box;
+    job_.prompts = &questions;
+    const Status status = work(job_);
+    job_.box = nullptr;
+    job_.prompts = nullptr;
+    Tell([this, status] {
+      running_ = false;
+      windows_.BatchEnded(status, job_);
+    });
+  });
+}
+
+bool BatchThread::AskWindow(const std::function<void()>& action) {
+  // Shared with the window's thread, which may come to it after the batch was given up.
+  struct Turn {
+    std::mutex mutex;
+    bool done = false;
+    bool dropped = false;
+  };
+  auto turn = std::make_shared<Turn>();
+  Tell([this, turn, action] {
+    {
+      const std::lock_guard lock(turn->mutex);
+      if (turn->dropped) return;
+      action();
+      turn->done = true;
+    }
+    const std::lock_guard lock(mutex_);
+    answered_.notify_all();
+  });
+  std::unique_lock lock(mutex_);
+  while (true) {
+    {
+      const std::unique_lock turnLock(turn->mutex, std::try_to_lock);
+      if (turnLock.owns_lock() && turn->done) return true;
+      if (turnLock.owns_lock() && given_) {
+        turn->dropped = true;
+        return false;
+      }
+    }
+    answered_.wait_for(lock, std::chrono::milliseconds(100));
+  }
+}
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,86 @@
+#pragma once
+
+#include <condition_variable>
+#include <functional>
+#include <memory>
+#include <mutex>
+#include <optional>
+#include <string>
+#include <thread>
+#include <vector>
+
+#include "batch/job.h"
+#include "batch/progress_box.h"
+#include "batch/prompts.h"
+#include "batch/run.h"
+#include "desktop/models/view/rgb_image.h"
+
+namespace fotomill::desktop {
+
+// What the overwrite prompt shows beside its question, made where the batch runs.
+struct OverwritePreview {
+  RgbImage existing, incoming;
+  std::string existingText, incomingText;  // size, dimensions and date of each, a line each
+};
+
+// What a batch tells and asks its windows. Every call comes on the window's thread.
+class BatchWindows {
+ public:
+  virtual ~BatchWindows() = default;
+  virtual void BatchOpened() = 0;
+  // `outcome` is that of the file that the line is about, empty for lines about the batch.
+  virtual void BatchLine(const ProgressLine& line, const FileOutcome& outcome) = 0;
+  virtual void BatchStatus(const std::string& status) = 0;
+  virtual void BatchProgress(uint32_t done, uint32_t count) = 0;
+  // The end: the box stays open to be read, or goes.
+  virtual void BatchStaysOpen(const ProgressModel& model) = 0;
+  virtual void BatchCloses() = 0;
+  virtual OverwriteAnswer AskOverwrite(const OverwriteQuestion& question, const OverwritePreview& preview) = 0;
+  virtual std::optional<std::string> AskDestinationName(const NameQuestion& question) = 0;
+  virtual std::optional<std::string> AskPassword(const std::string& path) = 0;
+  virtual bool ConfirmFormat(const std::string& question) = 0;
+  virtual bool Confirm(const std::string& question, const std::string& yes) = 0;
+  virtual void StoreFlag(KeyNumber key, bool value) = 0;
+  // After everything else; the thread is about to end.
+  virtual void BatchEnded(Status status, const BatchJob& job) = 0;
+};
+
+// Runs one batch on a thread of its own; its reports and questions go to the windows by `post`, which has to run what it is
+// given on the window's thread, in order. A question holds the batch until it is answered.
+class BatchThread {
+ public:
+  using Post = std::function<void(std::function<void()>)>;
+
+  BatchThread(BatchWindows& windows, Post post) : windows_(windows), post_(std::move(post)) {}
+  // Asks a running batch to stop, answers its questions with no, and waits for it. `post` must not be waiting for this.
+  ~BatchThread();
+  BatchThread(const BatchThread&) = delete;
+  BatchThread& operator=(const BatchThread&) = delete;
+
+  void Start(std::vector<BatchFile> files, BatchFunction function, BatchJob job);
+  // Any other work that reports to a box: `work` gets the job, with box and prompts set, and returns its status.
+  using Work = std::function<Status(BatchJob& job)>;
+  void StartWork(BatchJob job, Work work);
+  bool Running() const { return running_; }
+
+ private:
+  class Box;
+  class Questions;
+  // Runs `action` on the window's thread and waits for it. False when the batch is being given up.
+  bool AskWindow(const std::function<void()>& action);
+  void Tell(std::function<void()> action) { post_(std::move(action)); }
+
+  BatchWindows& windows_;
+  const Post post_;
+  BatchJob job_;
+  std::thread thread_;
+  std::mutex mutex_;
+  std::condition_variable answered_;
+  bool given_ = false;    // up
+  bool running_ = false;  // belongs to the window's thread
+};
+
+// What the overwrite prompt shows of the file that is there and of the new picture, which may be missing.
+OverwritePreview MakeOverwritePreview(const OverwriteQuestion& question, int32_t side);
+
+}  // namespace fotomill::desktop

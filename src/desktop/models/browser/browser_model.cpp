@@ -1,0 +1,272 @@
+#include "desktop/models/browser/browser_model.h"
+
+#include <algorithm>
+#include <cstdio>
+#include <numeric>
+#include <unordered_map>
+
+#include "core/choice_lists.h"
+#include "core/natural_order.h"
+#include "core/text.h"
+#include "platform/clock.h"
+#include "platform/paths.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+template <typename T>
+int Compare(const T& a, const T& b) {
+  return a < b ? -1 : b < a ? 1 : 0;
+}
+
+int CompareType(const FolderItem& a, const FolderItem& b) {
+  return LowerCase(platform::ExtensionOf(a.name)).compare(LowerCase(platform::ExtensionOf(b.name)));
+}
+int CompareSize(const FolderItem& a, const FolderItem& b) { return Compare(a.size, b.size); }
+int CompareDate(const FolderItem& a, const FolderItem& b) { return Compare(a.modified, b.modified); }
+int CompareTaken(const FolderItem& a, const FolderItem& b) { return Compare(a.taken, b.taken); }
+int CompareDimensions(const FolderItem& a, const FolderItem& b) {
+  return Compare(int64_t{a.width} * a.height, int64_t{b.width} * b.height);
+}
+
+using Comparison = int (*)(const FolderItem& a, const FolderItem& b);
+
+// By choice::SortMode; equal ones, and all of kSortName, are in order of their names.
+constexpr Comparison kComparisons[] = {nullptr, CompareType, CompareSize, CompareDate, CompareTaken, CompareDimensions};
+
+Comparison ComparisonOf(int32_t mode) {
+  return mode >= 0 && mode < static_cast<int32_t>(std::size(kComparisons)) ? kComparisons[mode] : nullptr;
+}
+
+bool BeginsWith(std::string_view name, std::string_view typed) {
+  return name.size() >= typed.size() && EqualIgnoringCase(name.substr(0, typed.size()), typed);
+}
+
+}  // namespace
+
+void BrowserModel::SetView(const FolderView& view) {
+  const bool sort = view.modes.sort != view_.modes.sort || view.descending != view_.descending;
+  view_ = view;
+  if (sort) UpdateOrder();
+}
+
+void BrowserModel::SetSort(int32_t sortMode, bool descending) {
+  FolderView view = view_;
+  view.modes.sort = sortMode;
+  view.descending = descending;
+  SetView(view);
+}
+
+void BrowserModel::SetFolder(const std::string& folder) {
+  folder_ = folder;
+  filter_.clear();
+  items_.clear();
+  order_.clear();
+  lines_.clear();
+  hiddenSelected_.clear();
+  selection_.Reset(0);
+}
+
+void BrowserModel::SetItems(std::vector<FolderItem> items) {
+  std::unordered_map<std::string_view, size_t> old;
+  old.reserve(items_.size());
+  for (size_t i = 0; i < items_.size(); ++i) old.emplace(items_[i].name, i);
+
+  const std::vector<bool> oldSelected = SelectedItems();
+  const size_t oldFocus = ItemOrNone(selection_.Focus()), oldAnchor = ItemOrNone(selection_.Anchor());
+  const size_t focusLine = selection_.Focus();
+  std::vector<bool> selected(items.size());
+  size_t focus = kNoLine, anchor = kNoLine;
+  for (size_t i = 0; i < items.size(); ++i) {
+    const auto found = old.find(items[i].name);
+    if (found == old.end()) continue;
+    const FolderItem& before = items_[found->second];
+    selected[i] = oldSelected[found->second];
+    if (found->second == oldFocus) focus = i;
+    if (found->second == oldAnchor) anchor = i;
+    if (before.modified == items[i].modified && before.size == items[i].size) items[i] = before;
+  }
+  items_ = std::move(items);
+  SortItems();
+  BuildLines(selected, focus, anchor);
+  if (focus == kNoLine && focusLine != kNoLine && !lines_.empty()) {
+    const size_t line = std::min(focusLine, lines_.size() - 1);
+    if (selection_.SelectedCount() == 0) {
+      selection_.SelectOnly(line);
+    } else {
+      selection_.MoveFocus(line, false, true);
+    }
+  }
+}
+
+void BrowserModel::UpdateOrder() {
+  const std::vector<bool> selected = SelectedItems();
+  const size_t focus = ItemOrNone(selection_.Focus()), anchor = ItemOrNone(selection_.Anchor());
+  SortItems();
+  BuildLines(selected, focus, anchor);
+}
+
+void BrowserModel::SetFilter(const std::string& filter) {
+  if (filter == filter_) return;
+  const std::vector<bool> selected = SelectedItems();
+  const size_t focus = ItemOrNone(selection_.Focus()), anchor = ItemOrNone(selection_.Anchor());
+  filter_ = filter;
+  BuildLines(selected, focus, anchor);
+}
+
+void BrowserModel::SortItems() {
+  order_.resize(items_.size());
+  std::iota(order_.begin(), order_.end(), 0u);
+  const Comparison compare = ComparisonOf(view_.modes.sort);
+  const int sign = view_.descending ? -1 : 1;
+  std::sort(order_.begin(), order_.end(), [&](uint32_t left, uint32_t right) {
+    const FolderItem& a = items_[left];
+    const FolderItem& b = items_[right];
+    if (a.folder != b.folder) return a.folder;
+    int order = compare != nullptr && !a.folder ? compare(a, b) : 0;
+    if (order == 0) order = CompareNatural(a.name, b.name);
+    return order * sign < 0;
+  });
+}
+
+std::vector<bool> BrowserModel::SelectedItems() const {
+  std::vector<bool> selected = hiddenSelected_;
+  selected.resize(items_.size());
+  for (size_t line = 0; line < lines_.size(); ++line) selected[lines_[line]] = selection_.IsSelected(line);
+  return selected;
+}
+
+void BrowserModel::BuildLines(const std::vector<bool>& selectedItems, size_t focusItem, size_t anchorItem) {
+  lines_.clear();
+  hiddenSelected_ = selectedItems;
+  std::vector<bool> selected;
+  size_t focus = kNoLine, anchor = kNoLine;
+  for (const uint32_t item : order_) {
+    if (!filter_.empty() && !MatchesFilter(items_[item].name, filter_)) continue;
+    if (item == focusItem) focus = lines_.size();
+    if (item == anchorItem) anchor = lines_.size();
+    selected.push_back(selectedItems[item]);
+    hiddenSelected_[item] = false;
+    lines_.push_back(item);
+  }
+  selection_.Assign(std::move(selected), focus, anchor);
+}
+
+std::string BrowserModel::PathOfLine(size_t line) const { return platform::JoinFolder(folder_, Line(line).name); }
+
+size_t BrowserModel::FindLine(std::string_view name) const {
+  for (size_t line = 0; line < lines_.size(); ++line) {
+    if (Line(line).name == name) return line;
+  }
+  return kNoLine;
+}
+
+size_t BrowserModel::FindTyped(std::string_view typed, bool next) const {
+  const size_t count = lines_.size();
+  const size_t focus = selection_.Focus() == kNoLine ? 0 : selection_.Focus();
+  for (size_t step = next ? 1 : 0; step < count + (next ? 1 : 0); ++step) {
+    const size_t line = (focus + step) % count;
+    if (BeginsWith(Line(line).name, typed)) return line;
+  }
+  return kNoLine;
+}
+
+std::vector<std::string> BrowserModel::FilesForFunction() const {
+  std::vector<std::string> files;
+  for (const size_t line : selection_.SelectedLines()) {
+    if (!Line(line).folder) files.push_back(PathOfLine(line));
+  }
+  const size_t focus = selection_.Focus();
+  if (selection_.SelectedCount() == 0 && focus != kNoLine && !Line(focus).folder) files.push_back(PathOfLine(focus));
+  return files;
+}
+
+std::vector<std::string> BrowserModel::PathsForFunction() const {
+  std::vector<std::string> paths;
+  for (const size_t line : selection_.SelectedLines()) paths.push_back(PathOfLine(line));
+  if (paths.empty() && selection_.Focus() != kNoLine) paths.push_back(PathOfLine(selection_.Focus()));
+  return paths;
+}
+
+bool BrowserModel::HasFileForFunction() const {
+  const size_t focus = selection_.Focus();
+  return selection_.SelectedCount() > 0 || (focus != kNoLine && !Line(focus).folder);
+}
+
+std::vector<std::string> BrowserModel::ShownFiles() const {
+  std::vector<std::string> files;
+  files.reserve(lines_.size());
+  for (size_t line = 0; line < lines_.size(); ++line) {
+    if (!Line(line).folder) files.push_back(PathOfLine(line));
+  }
+  return files;
+}
+
+void BrowserModel::SelectMatching(std::string_view pattern, MatchMode mode) {
+  for (size_t line = 0; line < lines_.size(); ++line) {
+    const bool matches = !pattern.empty() && MatchesFilter(Line(line).name, pattern);
+    if (matches || mode == MatchMode::Only) selection_.Set(line, matches && mode != MatchMode::TakeOut);
+  }
+}
+
+void BrowserModel::SelectSameType() {
+  if (selection_.Focus() == kNoLine) return;
+  const FolderItem& focused = Line(selection_.Focus());
+  for (size_t line = 0; line < lines_.size(); ++line) {
+    const FolderItem& item = Line(line);
+    selection_.Set(line, item.folder == focused.folder && item.format == focused.format);
+  }
+}
+
+std::string BrowserModel::CountText() const {
+  size_t files = 0, folders = 0;
+  uint64_t bytes = 0;
+  for (const uint32_t item : lines_) {
+    ++(items_[item].folder ? folders : files);
+    if (selection_.SelectedCount() == 0) bytes += items_[item].size;
+  }
+  for (const size_t line : selection_.SelectedLines()) bytes += Line(line).size;
+  const auto count = [](size_t number, const char* what) {
+    return WithThousands(number) + " " + what + (number == 1 ? "" : "s");
+  };
+  std::string text = count(files, "file");
+  if (folders > 0) text += ", " + count(folders, "folder");
+  if (lines_.size() < items_.size()) text += " of " + WithThousands(items_.size());
+  if (selection_.SelectedCount() > 0) text += ", " + WithThousands(selection_.SelectedCount()) + " selected";
+  if (files > 0) text += ", " + SizeText(bytes, choice::kSizeFitting);
+  return text;
+}
+
+std::string BrowserModel::FocusText() const {
+  const size_t focus = selection_.Focus();
+  if (focus >= LineCount()) return {};
+  std::string text = Line(focus).name + (Line(focus).folder ? ", folder, " : ", ");
+  text += WithThousands(focus + 1) + " of " + WithThousands(LineCount());
+  return text + (selection_.IsSelected(focus) ? ", selected" : "");
+}
+
+std::string SizeText(uint64_t bytes, int32_t mode) {
+  constexpr const char* kUnits[] = {"KB", "MB", "GB", "TB", "PB", "EB"};
+  if (mode == choice::kSizeBytes) return WithThousands(bytes) + (bytes == 1 ? " byte" : " bytes");
+  if (mode == choice::kSizeKilobytes) return WithThousands((bytes + 1023) / 1024) + " KB";
+  if (bytes < 1024) return WithThousands(bytes) + (bytes == 1 ? " byte" : " bytes");
+  double value = static_cast<double>(bytes) / 1024;
+  size_t unit = 0;
+  while (value >= 999.5 && unit + 1 < std::size(kUnits)) {
+    value /= 1024;
+    ++unit;
+  }
+  char text[32];
+  std::snprintf(text, sizeof text, value < 99.95 ? "%.1f %s" : "%.0f %s", value, kUnits[unit]);
+  return text;
+}
+
+std::string DateText(int64_t seconds) {
+  const platform::LocalTime time = platform::LocalTimeOf(seconds);
+  char text[64];
+  std::snprintf(text, sizeof text, "%04d-%02d-%02d %02d:%02d", time.year, time.month, time.day, time.hour, time.minute);
+  return text;
+}
+
+}  // namespace fotomill::desktop

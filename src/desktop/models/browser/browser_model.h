@@ -1,0 +1,93 @@
+#pragma once
+
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "desktop/models/browser/folder_listing.h"
+#include "desktop/models/browser/folder_views.h"
+#include "desktop/models/browser/selection.h"
+
+namespace fotomill::desktop {
+
+// What becomes of the selection of lines whose names match a pattern: they alone are selected, they as well, or not any more.
+enum class MatchMode { Only, Add, TakeOut };
+
+// What one browser shows: the items of a folder in their order, those that pass the filter as lines, and the selection
+// among the lines. No window, no file access.
+class BrowserModel {
+ public:
+  const std::string& Folder() const { return folder_; }
+  const BrowserModes& Modes() const { return view_.modes; }
+  bool Descending() const { return view_.descending; }
+  const FolderView& View() const { return view_; }
+  void SetView(const FolderView& view);  // sorts anew where the order changes
+  void SetSort(int32_t sortMode, bool descending);
+
+  // Another folder, empty until its listing comes.
+  void SetFolder(const std::string& folder);
+  // The folder's items; what was selected or focused stays so where an item of the name is still there. When the focused
+  // item has gone, the focus goes to the line that took its place. Facts that the new items lack are taken over.
+  void SetItems(std::vector<FolderItem> items);
+  // Facts that were found later; sorts anew only by UpdateOrder.
+  void SetFacts(size_t item, const FolderItem& facts) { items_[item] = facts; }
+  void UpdateOrder();
+
+  // Only lines whose name matches are shown; selection of others comes back with them.
+  void SetFilter(const std::string& filter);
+  const std::string& Filter() const { return filter_; }
+
+  size_t ItemCount() const { return items_.size(); }
+  const FolderItem& Item(size_t item) const { return items_[item]; }
+  size_t LineCount() const { return lines_.size(); }
+  size_t ItemOfLine(size_t line) const { return lines_[line]; }
+  const FolderItem& Line(size_t line) const { return items_[lines_[line]]; }
+  std::string PathOfLine(size_t line) const;
+  // The line of that name, kNoLine when it is not shown.
+  size_t FindLine(std::string_view name) const;
+  // The next line whose name begins with `typed`, from the focus on: `typed` of one letter typed again goes on to the next.
+  size_t FindTyped(std::string_view typed, bool next) const;
+
+  Selection& Selected() { return selection_; }
+  const Selection& Selected() const { return selection_; }
+  // What functions work on: the selected files in list order; without a selection the focused one.
+  std::vector<std::string> FilesForFunction() const;
+  // The same with folders.
+  std::vector<std::string> PathsForFunction() const;
+  bool HasPathForFunction() const { return selection_.SelectedCount() > 0 || selection_.Focus() != kNoLine; }
+  bool HasFileForFunction() const;
+  // All files that are shown, in list order.
+  std::vector<std::string> ShownFiles() const;
+  void SelectMatching(std::string_view pattern, MatchMode mode);
+  void SelectSameType();
+
+  // "312 files, 4 selected, 18.2 MB"
+  std::string CountText() const;
+  // The focused line for the ear: "a.bmp, 1 of 12, selected". Empty without one.
+  std::string FocusText() const;
+
+ private:
+  struct Keep;
+  void SortItems();
+  void BuildLines(const std::vector<bool>& selectedItems, size_t focusItem, size_t anchorItem);
+  std::vector<bool> SelectedItems() const;
+  size_t ItemOrNone(size_t line) const { return line < lines_.size() ? lines_[line] : kNoLine; }
+
+  std::string folder_;
+  FolderView view_;
+  std::string filter_;
+  std::vector<FolderItem> items_;     // as listed
+  std::vector<uint32_t> order_;       // all items in sorted order
+  std::vector<uint32_t> lines_;       // those that pass the filter
+  std::vector<bool> hiddenSelected_;  // items that are selected though the filter hides them
+  Selection selection_;               // over the lines
+};
+
+// A size for people: "740 bytes", "18.2 MB"; by choice::SizeMode.
+std::string SizeText(uint64_t bytes, int32_t mode);
+// "2026-11-21 19:05"
+std::string DateText(int64_t seconds);
+
+}  // namespace fotomill::desktop

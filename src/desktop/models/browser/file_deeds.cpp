@@ -1,0 +1,266 @@
+#include "desktop/models/browser/file_deeds.h"
+
+#include <algorithm>
+#include <set>
+
+#include "batch/destination_name.h"
+#include "desktop/models/browser/previous_file.h"
+#include "desktop/models/thumbnails/thumbnail.h"
+#include "platform/file_view.h"
+#include "platform/files.h"
+#include "platform/folders.h"
+#include "platform/output_file.h"
+#include "platform/paths.h"
+#include "settings/settings.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+constexpr const char* kTaken = "There is a file of that name already.";
+constexpr const char* kGone = "It is not there any more.";
+constexpr int kDeepest = 64;  // folders in folders
+
+// Empty when it went well, else the reason.
+using Outcome = std::string;
+
+std::string FolderOf(const std::string& path) { return std::string(platform::SplitPath(path).folder); }
+
+Outcome CopyFile(const std::string& from, const std::string& to, platform::Existing existing) {
+  constexpr size_t kPart = 4 * 1024 * 1024;
+  platform::FileView view;
+  platform::OutputFile output;
+  if (!view.Open(from)) return "It cannot be read.";
+  if (!output.Create(to)) return "The folder cannot be written to.";
+  const auto bytes = view.Bytes();
+  for (size_t at = 0; at < bytes.size(); at += kPart) {
+    if (!output.Write(bytes.subspan(at, std::min(kPart, bytes.size() - at))))
+      return "The copy could not be written; the disk may be full.";
+  }
+  if (!view.Intact()) return "It was cut short while it was copied.";
+  const platform::CommitResult result = output.Commit(existing);
+  if (result == platform::CommitResult::Taken) return kTaken;
+  if (result != platform::CommitResult::Done) return "The copy could not be written; the disk may be full.";
+  (void)platform::CopyTimes(from, to);
+  return {};
+}
+
+Outcome CopyTree(const std::string& from, const std::string& to, int depth) {
+  if (!platform::IsFolder(from)) return CopyFile(from, to, platform::Existing::Refuse);
+  if (depth > kDeepest) return "Its folders lie too deep in each other.";
+  if (to.starts_with(platform::JoinFolder(from, ""))) return "A folder cannot be copied into itself.";
+  if (platform::FileExists(to)) return kTaken;
+  const auto entries = platform::ListFolder(from);
+  if (!entries) return "The folder cannot be read.";
+  if (!platform::MakeFolders(to)) return "The folder cannot be made.";
+  for (const platform::FolderEntry& entry : *entries) {
+    Outcome outcome = entry.link
+                          ? Outcome("It holds a link, which is not copied.")
+                          : CopyTree(platform::JoinFolder(from, entry.name), platform::JoinFolder(to, entry.name), depth + 1);
+    if (!outcome.empty()) return outcome;
+  }
+  return {};
+}
+
+Outcome DeleteTree(const std::string& path, int depth) {
+  if (!platform::IsFolder(path) || platform::FactsOf(path).link) {
+    return platform::DeleteFile(path) ? Outcome() : Outcome("It could not be deleted.");
+  }
+  if (depth > kDeepest) return "Its folders lie too deep in each other.";
+  for (const platform::FolderEntry& entry : platform::ListFolder(path).value_or(std::vector<platform::FolderEntry>())) {
+    Outcome outcome = DeleteTree(platform::JoinFolder(path, entry.name), depth + 1);
+    if (!outcome.empty()) return outcome;
+  }
+  return platform::DeleteFolder(path) ? Outcome() : Outcome("The folder could not be deleted.");
+}
+
+bool SameVolume(const std::string& a, const std::string& b) {
+  return platform::FactsOf(a).device == platform::FactsOf(FolderOf(b)).device;
+}
+
+Outcome MoveOne(const std::string& from, const std::string& to) {
+  if (!platform::FileExists(from)) return kGone;
+  if (platform::FileExists(to) && from != to) {
+    const platform::FileFacts a = platform::FactsOf(from), b = platform::FactsOf(to);
+    const bool same = a.identity == b.identity && a.device == b.device;  // a name that differs in case only
+    if (!same) return kTaken;
+  }
+  if (to.starts_with(platform::JoinFolder(from, ""))) return "A folder cannot be moved into itself.";
+  const platform::CommitResult result = platform::RenameFile(from, to, platform::Existing::Refuse);
+  if (result == platform::CommitResult::Done) return {};
+  if (result == platform::CommitResult::Taken) return kTaken;
+  if (SameVolume(from, to)) return "It could not be renamed.";
+  // On another volume a move is a copy and a deletion; what was copied goes again if the rest of it fails.
+  Outcome outcome = CopyTree(from, to, 0);
+  if (!outcome.empty()) {
+    if (outcome != kTaken) (void)DeleteTree(to, 0);
+    return outcome;
+  }
+  return DeleteTree(from, 0);
+}
+
+Outcome TrashOne(const std::string& path) {
+  if (!platform::FileExists(path)) return kGone;
+  return platform::MoveToTrash(path) ? Outcome() : Outcome("There is no trash for it; Shift+Delete deletes for good.");
+}
+
+Outcome Restore(const std::string& path) {
+  if (platform::FileExists(path)) return kTaken;
+  return platform::RestoreFromTrash(path) ? Outcome() : Outcome("It is not in the trash any more.");
+}
+
+// The file becomes what it was before, and what it was until now is kept in its place.
+Outcome Exchange(const FileStep& step) {
+  if (!platform::FileExists(step.from)) return kGone;
+  if (step.previous->HasChanged(step.from)) return "It has changed since and stays.";
+  PreviousFile now;
+  if (!now.Keep(step.from)) return "There is no room to keep it as it is now.";
+  DropThumbnails(step.from);
+  Outcome outcome = CopyFile(step.previous->Path(), step.from, platform::Existing::Replace);
+  if (!outcome.empty()) return outcome;
+  step.previous->Swap(now);
+  step.previous->Replaced(step.from);
+  return {};
+}
+
+Outcome DoStep(DeedKind kind, const FileStep& step) {
+  switch (kind) {
+    case DeedKind::Rename:
+    case DeedKind::Move: return MoveOne(step.from, step.to);
+    case DeedKind::Copy: return CopyTree(step.from, step.to, 0);
+    case DeedKind::Create: return Restore(step.to);
+    case DeedKind::Turn: return Exchange(step);
+    case DeedKind::Trash: break;
+  }
+  return TrashOne(step.from);
+}
+
+// A copy that somebody has worked on since stays.
+Outcome RemoveCopy(const FileStep& step) {
+  const platform::FileFacts copy = platform::FactsOf(step.to), original = platform::FactsOf(step.from);
+  if (copy.kind == platform::FileKind::Missing) return kGone;
+  const bool changed = copy.kind == platform::FileKind::Regular && original.kind == platform::FileKind::Regular &&
+                       (copy.size != original.size || copy.modified != original.modified);
+  if (changed) return "The copy has changed since and stays.";
+  return TrashOne(step.to);
+}
+
+Outcome UndoStep(DeedKind kind, const FileStep& step) {
+  switch (kind) {
+    case DeedKind::Rename:
+    case DeedKind::Move: return MoveOne(step.to, step.from);
+    case DeedKind::Copy: return RemoveCopy(step);
+    case DeedKind::Create: return TrashOne(step.to);
+    case DeedKind::Turn: return Exchange(step);
+    case DeedKind::Trash: break;
+  }
+  return Restore(step.from);
+}
+
+const char* KindName(DeedKind kind) {
+  switch (kind) {
+    case DeedKind::Rename: return "rename";
+    case DeedKind::Move: return "move";
+    case DeedKind::Copy: return "copy";
+    case DeedKind::Create: return "output";
+    case DeedKind::Turn: return "rotation";
+    case DeedKind::Trash: break;
+  }
+  return "deletion";
+}
+
+}  // namespace
+
+FileDeed PlanDeed(DeedKind kind, const std::vector<std::string>& paths, const std::string& folder) {
+  FileDeed deed{kind, {}};
+  std::set<std::string> planned;
+  for (const std::string& path : paths) {
+    if (kind == DeedKind::Trash) {
+      deed.steps.push_back({path, {}});
+      continue;
+    }
+    std::string target = platform::JoinFolder(folder, platform::FileNameOf(path));
+    if (kind == DeedKind::Move && target == path) continue;
+    const TakenTest taken = [&](const std::string& candidate) {
+      return planned.contains(candidate) || platform::FileExists(candidate);
+    };
+    if (taken(target)) (void)MakeNumberedVariant(target, settings.NumberedVariantMin, settings.NumberedVariantMax, taken);
+    planned.insert(target);
+    deed.steps.push_back({path, target});
+  }
+  return deed;
+}
+
+DeedResult CarryOut(const FileDeed& deed, const DeedProgress& progress) {
+  DeedResult result{{deed.kind, {}}, {}};
+  for (size_t i = 0; i < deed.steps.size(); ++i) {
+    if (progress && !progress(i, deed.steps.size())) break;
+    const Outcome outcome = DoStep(deed.kind, deed.steps[i]);
+    if (outcome.empty()) {
+      result.done.steps.push_back(deed.steps[i]);
+    } else {
+      result.failures.push_back({deed.steps[i].from, outcome});
+    }
+  }
+  return result;
+}
+
+DeedResult TakeBack(const FileDeed& deed, const DeedProgress& progress) {
+  DeedResult result{{deed.kind, {}}, {}};
+  for (size_t i = deed.steps.size(); i > 0; --i) {
+    if (progress && !progress(deed.steps.size() - i, deed.steps.size())) break;
+    const FileStep& step = deed.steps[i - 1];
+    const Outcome outcome = UndoStep(deed.kind, step);
+    if (outcome.empty()) {
+      result.done.steps.insert(result.done.steps.begin(), step);
+    } else {
+      result.failures.push_back({step.to.empty() ? step.from : step.to, outcome});
+    }
+  }
+  return result;
+}
+
+DeedResult DeleteForGood(const std::vector<std::string>& paths, const DeedProgress& progress) {
+  DeedResult result{{DeedKind::Trash, {}}, {}};
+  for (size_t i = 0; i < paths.size(); ++i) {
+    if (progress && !progress(i, paths.size())) break;
+    const Outcome outcome = DeleteTree(paths[i], 0);
+    if (!outcome.empty()) result.failures.push_back({paths[i], outcome});
+  }
+  return result;
+}
+
+std::string DeedName(const FileDeed& deed) {
+  std::string name = std::string(KindName(deed.kind)) + " of ";
+  if (deed.steps.size() == 1) return name.append(platform::FileNameOf(deed.steps[0].from));
+  return name + std::to_string(deed.steps.size()) + " files";
+}
+
+void UndoList::Keep(std::vector<FileDeed>& list, FileDeed deed) {
+  if (deed.steps.empty()) return;
+  list.push_back(std::move(deed));
+  if (list.size() > most_) list.erase(list.begin());
+}
+
+void UndoList::Add(FileDeed deed) {
+  if (deed.steps.empty()) return;
+  undone_.clear();
+  Keep(done_, std::move(deed));
+}
+
+FileDeed UndoList::TakeUndo() {
+  FileDeed deed = std::move(done_.back());
+  done_.pop_back();
+  return deed;
+}
+
+FileDeed UndoList::TakeRedo() {
+  FileDeed deed = std::move(undone_.back());
+  undone_.pop_back();
+  return deed;
+}
+
+void UndoList::Undone(FileDeed deed) { Keep(undone_, std::move(deed)); }
+void UndoList::Redone(FileDeed deed) { Keep(done_, std::move(deed)); }
+
+}  // namespace fotomill::desktop

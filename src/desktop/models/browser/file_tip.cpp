@@ -1,0 +1,57 @@
+#include "desktop/models/browser/file_tip.h"
+
+#include <algorithm>
+#include <string_view>
+#include <utility>
+
+#include "core/choice_lists.h"
+#include "desktop/models/browser/browser_model.h"
+#include "platform/paths.h"
+#include "registry/registry.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+constexpr size_t kLongestComment = 300;  // bytes
+
+// The beginning of a text that is not cut inside a character.
+std::string Beginning(std::string_view text) {
+  text = text.substr(0, text.find('\0'));
+  while (!text.empty() && static_cast<unsigned char>(text.back()) <= ' ') text.remove_suffix(1);
+  if (text.size() <= kLongestComment) return std::string(text);
+  size_t end = kLongestComment;
+  while (end > 0 && (static_cast<unsigned char>(text[end]) & 0xC0) == 0x80) --end;
+  return std::string(text.substr(0, end)) + "...";
+}
+
+// What only the file's header tells.
+void AddHeaderLines(const std::string& path, Status known, std::vector<std::string>& lines) {
+  PicturePointer picture;
+  const Status status = LoadPictureInfo(path.c_str(), picture);
+  const Status problem = status != Status::Ok ? status : known;
+  if (problem != Status::Ok) lines.emplace_back(StatusMessage(problem));
+  if (status != Status::Ok) return;
+  std::string facts = std::to_string(picture->width) + " x " + std::to_string(picture->height) + " pixels, " +
+                      std::to_string(picture->bitsPerPixel) + " bits";
+  if (picture->pageCount > 1) facts += ", " + std::to_string(picture->pageCount) + " pages";
+  lines.push_back(std::move(facts));
+  std::string comment = Beginning({reinterpret_cast<const char*>(picture->comment.data()), picture->comment.size()});
+  if (!comment.empty()) lines.push_back(std::move(comment));
+}
+
+}  // namespace
+
+std::vector<std::string> FileTipLines(const std::string& folder, const FolderItem& item, Status known) {
+  std::vector<std::string> lines{item.name};
+  if (item.folder) {
+    if (item.modified != 0) lines.push_back(DateText(item.modified));
+    return lines;
+  }
+  lines.push_back(DescribeFileType(item.name));
+  lines.push_back(SizeText(item.size, choice::kSizeFitting) + ", " + DateText(item.modified));
+  AddHeaderLines(platform::JoinFolder(folder, item.name), known, lines);
+  return lines;
+}
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,100 @@
+#include "desktop/models/browser/folder_listing.h"
+
+#include <algorithm>
+#include <unordered_map>
+
+#include "core/natural_order.h"
+#include "core/text.h"
+#include "metadata/exif/exif_source.h"
+#include "metadata/exif/exif_walk.h"
+#include "platform/files.h"
+#include "platform/paths.h"
+#include "registry/registry.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+// Formats by extension, so that a folder of 100,000 files asks the registry a handful of times.
+class FormatFinder {
+ public:
+  int32_t Find(std::string_view name) {
+    const std::string extension(platform::ExtensionOf(name));
+    const auto [found, added] = rows_.try_emplace(extension, kNoFormat);
+    if (added && !extension.empty() && !EqualIgnoringCase(extension, "THN")) found->second = FindFormatByName(name);
+    return found->second;
+  }
+
+ private:
+  std::unordered_map<std::string, int32_t> rows_;
+};
+
+// Finds the date on which a picture was taken: "2004:08:31 22:32:08" becomes 20040831223208.
+class TakenDate : public ExifSink {
+ public:
+  int64_t number = 0;
+  void Directory(int32_t, std::string_view) override {}
+  void Line(const ExifLine& line) override {
+    constexpr uint16_t kDateTimeOriginal = 0x9003;
+    if (line.value.tag != kDateTimeOriginal) return;
+    number = 0;
+    for (const char c : line.text.substr(0, 19)) {
+      if (c >= '0' && c <= '9') number = number * 10 + (c - '0');
+    }
+  }
+};
+
+}  // namespace
+
+FolderListing ListForBrowser(const std::string& folder, bool facts, const std::atomic<bool>& stop) {
+  FolderListing listing;
+  const auto entries = platform::ListFolder(folder);
+  if (!entries) return listing;
+  listing.readable = true;
+  FormatFinder formats;
+  for (const platform::FolderEntry& entry : *entries) {
+    if (stop) return listing;
+    if (entry.name.starts_with('.')) continue;
+    FolderItem item;
+    item.name = entry.name;
+    item.folder = entry.kind == platform::FileKind::Folder;
+    if (!item.folder) item.format = formats.Find(entry.name);
+    if (item.folder || (entry.kind == platform::FileKind::Regular && item.format != kNoFormat)) {
+      listing.items.push_back(std::move(item));
+    }
+  }
+  if (facts) AddFacts(folder, listing, stop);
+  return listing;
+}
+
+std::vector<std::string> SubfolderNames(const std::string& folder) {
+  std::vector<std::string> names;
+  for (const platform::FolderEntry& entry : platform::ListFolder(folder).value_or(std::vector<platform::FolderEntry>())) {
+    if (entry.kind == platform::FileKind::Folder && !entry.name.starts_with('.')) names.push_back(entry.name);
+  }
+  std::sort(names.begin(), names.end(), [](const auto& a, const auto& b) { return CompareNatural(a, b) < 0; });
+  return names;
+}
+
+void AddFacts(const std::string& folder, FolderListing& listing, const std::atomic<bool>& stop) {
+  for (FolderItem& item : listing.items) {
+    if (stop) return;
+    const platform::FileFacts facts = platform::FactsOf(platform::JoinFolder(folder, item.name));
+    item.size = item.folder ? 0 : facts.size;
+    item.modified = facts.modified;
+  }
+}
+
+void AddPictureFacts(const std::string& folder, FolderItem& item) {
+  const std::string path = platform::JoinFolder(folder, item.name);
+  PicturePointer picture;
+  if (LoadPictureInfo(path.c_str(), picture) != Status::Ok) return;
+  item.width = picture->width;
+  item.height = picture->height;
+  item.bits = picture->bitsPerPixel;
+  ExifSource exif;
+  TakenDate date;
+  if (exif.Open(path.c_str()) == Status::Ok && WalkExif(exif.Block(), &date)) item.taken = date.number;
+}
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,46 @@
+#pragma once
+
+#include <cstdint>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "desktop/models/browser/folder_views.h"
+
+namespace fotomill::desktop {
+
+// What is open: the tabs of a frame and its size. Kept as a text in the data folder, under the name TabsetCurrentName:
+//
+//   [Frame]            Width, Height (device-independent pixels), Maximized, Columns (of the details), Tab (the
+//                      one in front, from 0)
+//   [Tab]              Folder, ThumbnailMode, ViewMode, SortMode, Descending, Scroll (pixels), Focus (a name)
+//
+// a line "KEY=VALUE" each; lines that are not understood are passed over.
+struct SessionTab {
+  std::string folder;
+  FolderView view;
+  int64_t scroll = 0;
+  std::string focus;
+
+  bool operator==(const SessionTab&) const = default;
+};
+struct Session {
+  int32_t width = 0, height = 0;  // 0: nothing is known
+  bool maximized = false;
+  std::string columns;  // of the details
+  size_t tab = 0;
+  std::vector<SessionTab> tabs;
+
+  bool operator==(const Session&) const = default;
+};
+
+Session ParseSession(std::string_view text);
+// Tabs whose folder cannot stand on a line are left out.
+std::string SessionText(const Session& session);
+
+// The session of the last run, without tabs whose folder has gone. Empty when there is none.
+Session LoadSession();
+// False when it could not be written.
+bool SaveSession(const Session& session);
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,105 @@
+#include "desktop/models/setup/setup_help.h"
+
+#include "settings/setup_dialog.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+// Topics that buttons name, and where the manual has them.
+struct Topic {
+  std::string_view topic, heading;
+};
+constexpr Topic kTopics[] = {
+    {"OVERWRITE", "Overwriting"},
+    {"RENAME", "Renaming in sequence"},
+};
+
+// The lines between a heading of the third rank and the next heading; empty when there is no such heading.
+std::string_view EntryOf(std::string_view page, std::string_view title) {
+  const std::string heading = "\n### " + std::string(title) + "\n";
+  const size_t start = page.find(heading);
+  if (start == std::string_view::npos) return {};
+  const std::string_view rest = page.substr(start + heading.size());
+  return rest.substr(0, rest.find("\n#"));
+}
+
+std::string_view TakeLine(std::string_view& text) {
+  const std::string_view line = text.substr(0, text.find('\n'));
+  text.remove_prefix(line.size() == text.size() ? line.size() : line.size() + 1);
+  return line;
+}
+
+// Lines that stand by themselves: headings, items of lists, rows of tables, what is set in.
+bool StandsAlone(std::string_view line) {
+  return line.starts_with("    ") || line.starts_with("#") || line.starts_with("- ") || line.starts_with("|") ||
+         (line.size() > 2 && line[0] >= '1' && line[0] <= '9' && line.substr(1, 2) == ". ");
+}
+
+bool IsLeftOut(std::string_view line) { return line.starts_with("![") || line.starts_with("|---"); }
+
+// A line without marks of emphasis, code, links and tables. What is code stays as it is.
+std::string WithoutMarks(std::string_view line) {
+  std::string text;
+  bool address = false, code = false;
+  for (size_t i = 0; i < line.size(); ++i) {
+    const char c = line[i];
+    if (c == '`') {
+      code = !code;
+    } else if (code) {
+      text += c;
+    } else if (address) {
+      address = c != ')';
+    } else if (c == ']' && line.substr(i).starts_with("](")) {
+      address = true;
+    } else if (c == '|') {
+      while (text.ends_with(' ')) text.pop_back();
+      if (!text.empty()) text += "  ";
+    } else if (c != '*' && c != '[' && c != ']') {
+      text += c;
+    }
+  }
+  while (text.ends_with(' ')) text.pop_back();
+  return text.substr(std::min(text.find_first_not_of(' '), text.size()));
+}
+
+// A page as plain text, with paragraphs on one line each.
+std::string PlainText(std::string_view page) {
+  std::string text;
+  bool paragraph = false;
+  while (!page.empty()) {
+    std::string_view line = TakeLine(page);
+    if (IsLeftOut(line)) continue;
+    if (line.empty()) {
+      if (!text.empty() && !text.ends_with("\n\n")) text += text.ends_with('\n') ? "\n" : "\n\n";
+      paragraph = false;
+      continue;
+    }
+    const bool alone = StandsAlone(line);
+    if (paragraph) text += alone ? '\n' : ' ';
+    if (line.starts_with("#")) line.remove_prefix(line.find_first_not_of("# "));
+    text += line.starts_with("    ") ? std::string(line) : WithoutMarks(line);
+    paragraph = true;
+  }
+  while (text.ends_with('\n')) text.pop_back();
+  return text;
+}
+
+HelpText WholePage(std::string_view page) {
+  const std::string_view title = TakeLine(page);
+  return {std::string(title.substr(title.find_first_not_of("# "))), PlainText(page)};
+}
+
+}  // namespace
+
+bool HasHelpEntry(std::string_view key) { return !EntryOf(kSettingsPage, key).empty(); }
+
+HelpText HelpOn(std::string_view topic) {
+  for (const Topic& row : kTopics) {
+    if (row.topic == topic) return {std::string(row.heading), PlainText(EntryOf(kDesktopPage, row.heading))};
+  }
+  if (HasHelpEntry(topic)) return {std::string(topic), PlainText(EntryOf(kSettingsPage, topic))};
+  return WholePage(topic == kManual ? kDesktopPage : kConfigurationPage);
+}
+
+}  // namespace fotomill::desktop

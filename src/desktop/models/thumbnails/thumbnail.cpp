@@ -1,0 +1,203 @@
+#include "desktop/models/thumbnails/thumbnail.h"
+
+#include <algorithm>
+#include <mutex>
+#include <utility>
+#include <vector>
+
+#include "catalog/thumbnails/exif_thumbnail.h"
+#include "catalog/thumbnails/system_thumbnail.h"
+#include "catalog/thumbnails/thumbnail_database.h"
+#include "catalog/thumbnails/thumbnail_file.h"
+#include "core/choice_lists.h"
+#include "metadata/exif/exif_source.h"
+#include "metadata/exif/exif_walk.h"
+#include "platform/files.h"
+#include "platform/paths.h"
+#include "processing/geometry/scale.h"
+#include "registry/registry.h"
+#include "settings/settings.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+bool ReadCurrentFile(const ThumbnailWish& wish, ThumbnailRecord& record) {
+  const std::string path = ThumbnailPathFor(wish.path);
+  const platform::FileFacts facts = platform::FactsOf(path);
+  return facts.kind == platform::FileKind::Regular && facts.modified >= wish.modified && ReadThumbnailFile(record, path);
+}
+
+bool InDatabase(const ThumbnailWish& wish) { return wish.mode == choice::kGlobalDatabase || wish.mode == choice::kLocalDatabase; }
+
+std::string DatabaseFor(const ThumbnailWish& wish) {
+  return ThumbnailDatabasePath(wish.mode == choice::kGlobalDatabase ? std::string()
+                                                                    : std::string(platform::SplitPath(wish.path).folder));
+}
+
+// The database that was asked last stays open: its index is what makes a search quick. New records are gathered, since
+// every append waits for the disk.
+class OpenDatabase {
+ public:
+  bool Find(const ThumbnailWish& wish, ThumbnailRecord& record) {
+    const std::lock_guard lock(mutex_);
+    return Open(DatabaseFor(wish), false) && database_.Find(wish.path, VolumeKeyFor(wish.path), record);
+  }
+  void Add(const ThumbnailWish& wish, const ThumbnailRecord& record) {
+    const std::lock_guard lock(mutex_);
+    const std::string path = DatabaseFor(wish);
+    if (path != newPath_ || new_.size() >= kGathered) Write();
+    newPath_ = path;
+    new_.push_back({record, wish.path, VolumeKeyFor(wish.path), false});
+  }
+  void Flush() {
+    const std::lock_guard lock(mutex_);
+    Write();
+  }
+  void Drop(const std::string& path, const std::string& database) {
+    const std::lock_guard lock(mutex_);
+    Write();
+    if (platform::IsRegularFile(database) && Open(database, false)) (void)database_.Delete(path);
+  }
+
+ private:
+  static constexpr size_t kGathered = 64;
+
+  bool Open(const std::string& path, bool create) {
+    if (path == openPath_) return true;
+    openPath_.clear();
+    database_.CloseThumbnailDatabase();
+    if (database_.OpenThumbnailDatabase(path, create) != ThumbnailDatabase::Opened::Done) return false;
+    openPath_ = path;
+    return true;
+  }
+  // A database that cannot be written to costs the thumbnails no more than being made again.
+  void Write() {
+    const std::vector<DatabaseRecord> records = std::exchange(new_, {});
+    if (!records.empty() && Open(newPath_, true)) (void)database_.AppendDatabaseRecords(records, true);
+  }
+
+  std::mutex mutex_;
+  std::string openPath_, newPath_;
+  ThumbnailDatabase database_;
+  std::vector<DatabaseRecord> new_;
+};
+OpenDatabase openDatabase;
+
+bool FindRecord(const ThumbnailWish& wish, ThumbnailRecord& record) {
+  if (wish.side > kSmallThumbnailSide) return false;  // a record would have to be enlarged
+  if (wish.mode == choice::kDiskBased || settings.AlwaysUseTHN != 0) {
+    if (ReadCurrentFile(wish, record)) return true;
+  }
+  return InDatabase(wish) && openDatabase.Find(wish, record);
+}
+
+Status ScaleDown(const PackedImage& image, int32_t side, RgbImage& pixels) {
+  if (image.Width() <= side && image.Height() <= side) return ToRgb(image, pixels);
+  PackedImage scaled, noAlpha, noScaledAlpha;
+  RETURN_IF_BAD(
+      ScaleFiltered(image, noAlpha, FitSize(image.Width(), image.Height(), side), ScaleFilter::Bicubic, scaled, noScaledAlpha));
+  return ToRgb(scaled, pixels);
+}
+
+Status PixelsOfRecord(const ThumbnailRecord& record, int32_t side, RgbImage& pixels) {
+  PackedImage bitmap;
+  RETURN_IF_BAD(ThumbnailRecordToBitmap(record, bitmap));
+  RETURN_IF_BAD(ToRgb(bitmap, pixels));
+  pixels = WithoutMatte(pixels, static_cast<Color>(settings.ThumbnailMatte));
+  if (std::max(pixels.width, pixels.height) <= side) return Status::Ok;
+  RETURN_IF_BAD(ToPacked(pixels, bitmap));
+  return ScaleDown(bitmap, side, pixels);
+}
+
+Status PixelsOfPicture(PictureRecord& picture, int32_t side, RgbImage& pixels) {
+  RETURN_IF_BAD(PrepareForDisplay(picture, static_cast<Color>(settings.ThumbnailMatte)));
+  return ScaleDown(picture.image, side, pixels);
+}
+
+// A thumbnail that somebody has made before.
+bool TakeReady(const ThumbnailWish& wish, Thumbnail& thumbnail) {
+  ThumbnailRecord record;
+  if (FindRecord(wish, record) && PixelsOfRecord(record, wish.side, thumbnail.pixels) == Status::Ok) return true;
+  const bool fromSystem =
+      wish.mode == choice::kDiskBased && settings.UseWindowsThumbnailCache != 0 && wish.side > kSmallThumbnailSide;
+  const PicturePointer picture = fromSystem ? ReadSystemPicture(wish.path, wish.side) : nullptr;
+  return picture != nullptr && PixelsOfPicture(*picture, wish.side, thumbnail.pixels) == Status::Ok;
+}
+
+// The thumbnail in the file's EXIF, upright as the picture would be.
+bool TakeEmbedded(const ThumbnailWish& wish, Thumbnail& thumbnail) {
+  ExifSource source;
+  ExifFindings findings;
+  if (source.Open(wish.path.c_str()) != Status::Ok || !WalkExif(source.Block(), nullptr, &findings)) return false;
+  PicturePointer picture;
+  if (DecodeExifThumbnail(ExifThumbnail(source.Block(), findings), picture) != Status::Ok) return false;
+  picture->metadata.exif.assign(source.Block().begin(), source.Block().end());
+  thumbnail.standIn = true;
+  return PixelsOfPicture(*picture, wish.side, thumbnail.pixels) == Status::Ok && source.Intact();
+}
+
+void TakeFacts(const PictureRecord& picture, Thumbnail& thumbnail) {
+  thumbnail.width = picture.width;
+  thumbnail.height = picture.height;
+  thumbnail.bits = picture.bitsPerPixel;
+  thumbnail.pages = picture.pageCount;
+  thumbnail.alpha = (picture.alphaFlags & kHasAlpha) != 0;
+  thumbnail.animated = picture.pageCount > 1 && (FormatRow(picture.formatIndex).flags & FMT_ANIMATED) != 0;
+}
+
+// What a record does not know of files that may have several pages: it is quickly told by their heads.
+void TellPages(const std::string& path, Thumbnail& thumbnail) {
+  const int32_t format = FindFormatByName(path);
+  PicturePointer picture;
+  if (format == kNoFormat || format == kSpareRow || (FormatRow(format).flags & FMT_MULTI) == 0) return;
+  if (LoadPictureInfo(path.c_str(), picture) == Status::Ok) TakeFacts(*picture, thumbnail);
+}
+
+Status MakeFromPicture(const ThumbnailWish& wish, Thumbnail& thumbnail) {
+  PicturePointer picture;
+  RETURN_IF_BAD(LoadPictureInfo(wish.path.c_str(), picture));
+  TakeFacts(*picture, thumbnail);
+  picture->thumbnailSide = wish.side;
+  RETURN_IF_BAD(ReadPicture(*picture));
+  thumbnail.alpha = !picture->alpha.Empty();
+  RETURN_IF_BAD(PrepareForDisplay(*picture, static_cast<Color>(settings.ThumbnailMatte)));
+  ThumbnailRecord record;
+  if (InDatabase(wish) && settings.AutoCreateThumbnail != 0 && MakeThumbnailRecord(record, *picture))
+    openDatabase.Add(wish, record);
+  return ScaleDown(picture->image, wish.side, thumbnail.pixels);
+}
+
+}  // namespace
+
+ThumbnailPointer LoadThumbnail(const ThumbnailWish& wish) {
+  auto thumbnail = std::make_shared<Thumbnail>();
+  if (TakeReady(wish, *thumbnail)) {
+    TellPages(wish.path, *thumbnail);
+    return thumbnail;
+  }
+  if (wish.standIn) return TakeEmbedded(wish, *thumbnail) ? thumbnail : nullptr;
+  thumbnail->status = MakeFromPicture(wish, *thumbnail);
+  if (thumbnail->status != Status::Ok) thumbnail->pixels = {};
+  return thumbnail;
+}
+
+bool MayHoldThumbnail(int32_t format) { return format != kNoFormat && KeepsMetadata(FormatRow(format)); }
+
+void KeepThumbnailRecords() { openDatabase.Flush(); }
+
+void DropThumbnails(const std::string& path) {
+  const std::string file = ThumbnailPathFor(path);
+  ThumbnailRecord record;
+  if (!platform::FactsOf(file).link && ReadThumbnailFile(record, file)) (void)platform::DeleteFile(file);
+  openDatabase.Drop(path, ThumbnailDatabasePath({}));
+  openDatabase.Drop(path, ThumbnailDatabasePath(std::string(platform::SplitPath(path).folder)));
+}
+
+Status WriteThumbnail(const std::string& path) {
+  ThumbnailRecord record;
+  RETURN_IF_BAD(MakeThumbnailOfFile(path, record));
+  return WriteThumbnailFile(record, ThumbnailPathFor(path)) ? Status::Ok : Status::ErrorCreatingFile;
+}
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,55 @@
+#pragma once
+
+#include <cstdint>
+#include <memory>
+#include <string>
+
+#include "core/status.h"
+#include "desktop/models/view/rgb_image.h"
+
+namespace fotomill::desktop {
+
+// What a thumbnail is wanted for. The file's time and size are part of it: a changed file is another one.
+struct ThumbnailWish {
+  std::string path;
+  int64_t modified = 0;
+  uint64_t size = 0;
+  int32_t side = 96;     // pixels of the square that it must fit
+  int32_t mode = 0;      // choice::ThumbnailMode: where records may be
+  bool standIn = false;  // whatever can be had at once will do, until the proper one comes
+
+  bool operator==(const ThumbnailWish&) const = default;
+};
+
+struct Thumbnail {
+  Status status = Status::Ok;                          // why there are no pixels
+  RgbImage pixels;                                     // never larger than the square, nor enlarged
+  int32_t width = 0, height = 0, bits = 0, pages = 1;  // of the picture, 0 when it was not opened
+  bool alpha = false;
+  bool animated = false;  // the pages are frames that follow each other
+  bool standIn = false;   // the thumbnail that the file itself holds, which nobody has compared with the picture
+
+  uint64_t Bytes() const { return sizeof *this + pixels.bytes.size(); }
+};
+using ThumbnailPointer = std::shared_ptr<const Thumbnail>;
+
+// Gets a picture's thumbnail: a record from its thumbnail file or the database of the browser's mode when that is as new as the
+// picture and large enough, the system's own where large ones may come from there, else from the picture itself. Takes as long
+// as it takes; called by workers. A wish for a stand-in decodes no picture: it gets the proper thumbnail when there is one
+// ready, else the one that the file holds, and null when it holds none.
+ThumbnailPointer LoadThumbnail(const ThumbnailWish& wish);
+
+// Whether files of a row of the registry can hold a thumbnail of their own.
+bool MayHoldThumbnail(int32_t format);
+
+// Writes the records that were made for databases since the last call; LoadThumbnail does it as well, now and then.
+void KeepThumbnailRecords();
+
+// Deletes a picture's thumbnail file and its records in the global and the folder's database: it is about to become another one,
+// whose time need not be later.
+void DropThumbnails(const std::string& path);
+
+// Makes a picture's thumbnail record and writes its thumbnail file.
+Status WriteThumbnail(const std::string& path);
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,84 @@
+#pragma once
+
+#include <condition_variable>
+#include <cstdint>
+#include <functional>
+#include <list>
+#include <mutex>
+#include <string>
+#include <thread>
+#include <unordered_map>
+#include <vector>
+
+#include "desktop/models/thumbnails/thumbnail.h"
+
+namespace fotomill::desktop {
+
+// Loads thumbnails on worker threads, in the order in which they are wanted now. The wish of a result tells whether it is a
+// stand-in; its thumbnail is null when there is none. Where a stand-in was wanted and the proper one was ready, nobody loads it
+// again.
+class ThumbnailLoader {
+ public:
+  struct Result {
+    ThumbnailWish wish;
+    ThumbnailPointer thumbnail;
+  };
+  using Load = ThumbnailPointer (*)(const ThumbnailWish& wish);
+
+  // `wake` is called on a worker when results wait that nobody was told of yet, `idle` on the worker that has done the last
+  // wish.
+  ThumbnailLoader(unsigned workers, std::function<void()> wake, Load load = LoadThumbnail, void (*idle)() = KeepThumbnailRecords);
+  // Waits for what is in work.
+  ~ThumbnailLoader();
+  ThumbnailLoader(const ThumbnailLoader&) = delete;
+  ThumbnailLoader& operator=(const ThumbnailLoader&) = delete;
+
+  // What is wanted from here on, most urgent first. What was wanted before and waits is forgotten, what is in work goes on.
+  void Want(std::vector<ThumbnailWish> wishes);
+  std::vector<Result> TakeResults();
+  // Thumbnails that wait or are in work.
+  size_t Pending() const;
+
+ private:
+  void Work();
+
+  const std::function<void()> wake_;
+  const Load load_;
+  void (*const idle_)();
+  mutable std::mutex mutex_;
+  std::condition_variable wanted_;
+  std::vector<ThumbnailWish> wishes_;  // the most urgent last
+  std::vector<ThumbnailWish> inWork_;  // one a worker
+  std::vector<Result> results_;
+  bool stop_ = false;
+  std::vector<std::thread> workers_;
+};
+
+// How many workers a program should have that keeps a core for its windows.
+unsigned WorkerCount();
+
+// The thumbnails that were loaded, up to a number of bytes; the one that was not asked for the longest goes first.
+class ThumbnailCache {
+ public:
+  explicit ThumbnailCache(uint64_t capacity) : capacity_(capacity) {}
+  // Null when it is not there, or is there for another state of the file, or another side.
+  ThumbnailPointer Find(const ThumbnailWish& wish);
+  // The thumbnail of a path in whatever state and size there is: something to show until the right one comes.
+  ThumbnailPointer FindAny(const std::string& path) const;
+  void Put(const ThumbnailWish& wish, ThumbnailPointer thumbnail);
+  void Clear();
+  uint64_t Bytes() const { return bytes_; }
+  size_t Count() const { return entries_.size(); }
+
+ private:
+  struct Entry {
+    ThumbnailWish wish;
+    ThumbnailPointer thumbnail;
+  };
+  const uint64_t capacity_;
+  uint64_t bytes_ = 0;
+  std::list<Entry> entries_;  // the last used first
+  std::unordered_map<std::string, std::list<Entry>::iterator> places_;
+};
+
+}  // namespace fotomill::desktop

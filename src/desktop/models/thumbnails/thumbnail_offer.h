@@ -1,0 +1,43 @@
+#pragma once
+
+#include <atomic>
+#include <condition_variable>
+#include <functional>
+#include <memory>
+#include <mutex>
+#include <string>
+#include <vector>
+
+#include "catalog/thumbnails/thumbnail_update.h"
+
+namespace fotomill::desktop {
+
+// The offer to make missing thumbnail files of one folder, on a thread of its own: it looks for them, asks, waits for the
+// answer as long as it takes, and makes them on all cores but one.
+class ThumbnailOffer : public std::enable_shared_from_this<ThumbnailOffer> {
+ public:
+  // Called on the offer's thread.
+  struct Events {
+    std::function<void(int32_t count, int32_t selected)> ask;
+    std::function<void(size_t done, size_t total)> building;
+    std::function<void(bool changed, const ThumbnailBrowser& browser)> ended;
+  };
+  static std::shared_ptr<ThumbnailOffer> Start(ThumbnailBrowser browser, Events events);
+
+  // The answer: one of the choices, or 0.
+  void Answer(int32_t choice);
+  // Nobody is interested any more.
+  void Stop();
+
+ private:
+  class Face;
+  void Run(ThumbnailBrowser browser);
+
+  Events events_;
+  std::mutex mutex_;
+  std::condition_variable answered_;
+  int32_t answer_ = -1;  // none yet
+  std::atomic<bool> stop_{false};
+};
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,54 @@
+#pragma once
+
+#include <atomic>
+#include <cstdint>
+#include <string>
+#include <thread>
+#include <vector>
+
+#include "catalog/thumbnails/thumbnail_database.h"
+#include "core/progress.h"
+
+namespace fotomill::desktop {
+
+// Compaction of one thumbnail database on a thread of its own, for a window that shows how far it is.
+class DatabaseCompaction : private ProgressSink {
+ public:
+  // Begins at once; `purge` drops the thumbnails of missing pictures as well.
+  DatabaseCompaction(std::string path, bool purge);
+  // Stops it and waits; the database is then as it was, unless it was done.
+  ~DatabaseCompaction() override;
+  DatabaseCompaction(const DatabaseCompaction&) = delete;
+  DatabaseCompaction& operator=(const DatabaseCompaction&) = delete;
+
+  void Stop() { stop_ = true; }
+  bool Ended() const { return ended_; }
+  int32_t Done() const { return done_; }
+  int32_t Total() const { return total_; }  // records, 0 until it is known
+
+  // What became of it, once it has ended: a sentence or two for people.
+  bool Succeeded() const { return succeeded_; }
+  const std::string& Outcome() const { return outcome_; }
+
+ private:
+  void Step(int32_t done, int32_t total) override;
+  void Run(bool purge);
+
+  const std::string path_;
+  std::atomic<bool> stop_{false}, ended_{false};
+  std::atomic<int32_t> done_{0}, total_{0};
+  bool succeeded_ = false;  // written before `ended_`
+  std::string outcome_;
+  std::thread thread_;
+};
+
+// "1,234 records, 35.1 MB", or why there is nothing to compact.
+std::string DescribeDatabase(const std::string& path);
+
+// Thumbnail files of a folder, and with `below` of the folders below it, whose pictures are gone. Folders on optical drives
+// and those that cannot be read give none. Ends early when `stop` turns true.
+std::vector<std::string> FindOrphanThumbnails(const std::string& folder, bool below, const std::atomic<bool>& stop);
+// Deletes them; those that could not be deleted come back.
+std::vector<std::string> DeleteThumbnails(const std::vector<std::string>& files);
+
+}  // namespace fotomill::desktop

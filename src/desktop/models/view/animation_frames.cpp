@@ -1,0 +1,203 @@
+#include "desktop/models/view/animation_frames.h"
+
+#include <algorithm>
+
+#include "registry/registry.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+// A larger canvas is not played: beside it a copy, the frame that is made of that and the one on the screen must be held.
+constexpr uint64_t kMostCanvasBytes = uint64_t{256} << 20;
+
+// A record of its own for the frame that the animation has on its canvas.
+Status CopyFrame(const PictureRecord& facts, const Canvas& canvas, PicturePointer& picture) {
+  picture = NewPictureRecord();
+  if (picture == nullptr) return Status::MemoryAllocationError;
+  picture->fileName = facts.fileName;
+  picture->typeName = facts.typeName;
+  picture->fileSize = facts.fileSize;
+  picture->formatIndex = facts.formatIndex;
+  picture->pageCount = facts.pageCount;
+  picture->width = canvas.image.Width();
+  picture->height = canvas.image.Height();
+  picture->bitsPerPixel = 24;
+  picture->alphaFlags = kHasAlpha;
+  picture->metadata = facts.metadata;
+  RETURN_IF_BAD(NewPackedImage(picture->width, picture->height, nullptr, 24, picture->image, platform::Fill::Unset));
+  RETURN_IF_BAD(NewAlphaPlane(picture->width, picture->height, picture->alpha, platform::Fill::Unset));
+  std::ranges::copy(canvas.image.Rows(), picture->image.Rows().begin());
+  std::ranges::copy(canvas.alpha.Rows(), picture->alpha.Rows().begin());
+  return Status::Ok;
+}
+
+}  // namespace
+
+AnimationFrames::AnimationFrames(ViewWish wish, uint64_t capacity, std::function<void()> wake)
+    : capacity_(capacity), wake_(std::move(wake)), wish_(std::move(wish)), worker_([this] { Work(); }) {}
+
+AnimationFrames::~AnimationFrames() {
+  {
+    const std::lock_guard lock(mutex_);
+    stop_ = true;
+  }
+  wanted_.notify_all();
+  worker_.join();
+}
+
+size_t AnimationFrames::Count() const {
+  const std::lock_guard lock(mutex_);
+  return delaysMs_.size();
+}
+
+Status AnimationFrames::Failure() const {
+  const std::lock_guard lock(mutex_);
+  return failure_;
+}
+
+int32_t AnimationFrames::DelayMs(size_t frame) const {
+  const std::lock_guard lock(mutex_);
+  return frame < delaysMs_.size() ? ShownDelayMs(delaysMs_[frame]) : 0;
+}
+
+int32_t AnimationFrames::Rounds() const {
+  const std::lock_guard lock(mutex_);
+  return rounds_;
+}
+
+void AnimationFrames::Want(size_t frame) {
+  {
+    const std::lock_guard lock(mutex_);
+    if (frame == shown_ || frame >= frames_.size()) return;
+    shown_ = frame;
+    for (size_t i = 0; i < frames_.size(); ++i) {
+      if (!Keeps(i)) frames_[i].reset();
+    }
+  }
+  wanted_.notify_all();
+}
+
+ViewPicturePointer AnimationFrames::Find(size_t frame) const {
+  const std::lock_guard lock(mutex_);
+  return frame < frames_.size() ? frames_[frame] : nullptr;
+}
+
+void AnimationFrames::Fit(int32_t width, int32_t height) {
+  {
+    const std::lock_guard lock(mutex_);
+    wish_.fitWidth = width;
+    wish_.fitHeight = height;
+  }
+  wanted_.notify_all();
+}
+
+// How many frames may be kept: the one that is shown and the next one in any case.
+size_t AnimationFrames::Room() const {
+  const uint64_t room = frameBytes_ == 0 ? 2 : std::max<uint64_t>(capacity_ / frameBytes_, 2);
+  return static_cast<size_t>(std::min<uint64_t>(room, frames_.size()));
+}
+
+// Where not all frames have room, a quarter of it is for those before the one that is shown.
+bool AnimationFrames::Keeps(size_t frame) const {
+  const size_t count = frames_.size(), room = Room();
+  if (room == count) return true;
+  const size_t behind = (room - 1) / 4, ahead = room - 1 - behind;
+  return (frame + count - shown_) % count <= ahead || (shown_ + count - frame) % count <= behind;
+}
+
+bool AnimationFrames::IsFitted(size_t frame) const {
+  const ViewWish& wish = frames_[frame]->wish;
+  return wish.fitWidth == wish_.fitWidth && wish.fitHeight == wish_.fitHeight;
+}
+
+// What is to be decoded next: in the order of playing the first frame that is missing; then, where all are kept, the first one
+// that was made for another window.
+bool AnimationFrames::NextFrame(size_t& frame) const {
+  const size_t count = frames_.size();
+  const auto first = [&](auto isWanted) {
+    for (size_t i = 0; i < count; ++i) {
+      frame = (shown_ + i) % count;
+      if (isWanted(frame)) return true;
+    }
+    return false;
+  };
+  if (first([&](size_t i) { return frames_[i] == nullptr && (Keeps(i) || i == shown_); })) return true;
+  return Room() == count && first([&](size_t i) { return !IsFitted(i); });
+}
+
+Status AnimationFrames::Open(PicturePointer& facts, AnimationPointer& animation) {
+  RETURN_IF_BAD(LoadPictureInfo(wish_.path.c_str(), facts));
+  if (EstimateImageBytes(facts->width, facts->height, 32) > kMostCanvasBytes) return Status::MemoryAllocationError;
+  return OpenAnimation(wish_.path.c_str(), animation);
+}
+
+// Composes frames from `position`, the next one of the animation, up to the wanted one. Null when it cannot be had; the frames
+// then end at `position`.
+ViewPicturePointer AnimationFrames::Decode(size_t frame, const PictureRecord& facts, Animation& animation, size_t& position) {
+  ViewWish wish;
+  if (frame < position) {
+    animation.Rewind();
+    position = 0;
+  }
+  Status status = Status::Ok;
+  for (; position <= frame; ++position) {
+    status = animation.Next();
+    const std::lock_guard lock(mutex_);
+    wish = wish_;
+    if (status != Status::Ok) failure_ = status;
+    if (status != Status::Ok || stop_) return nullptr;
+  }
+  PicturePointer picture;
+  status = CopyFrame(facts, animation.Frame(), picture);
+  auto view = std::make_shared<ViewPicture>();
+  view->wish = wish;
+  if (status == Status::Ok) status = PrepareView(std::move(picture), *view);
+  if (status == Status::Ok) {
+    view->picture->metadata = {};  // the same for each frame
+    return view;
+  }
+  position = frame;
+  const std::lock_guard lock(mutex_);
+  failure_ = status;
+  return nullptr;
+}
+
+void AnimationFrames::Take(size_t frame, ViewPicturePointer picture) {
+  frameBytes_ = std::max(frameBytes_, picture->Bytes());
+  if (Keeps(frame) || frame == shown_) frames_[frame] = std::move(picture);
+}
+
+void AnimationFrames::Work() {
+  PicturePointer facts;
+  AnimationPointer animation;
+  size_t position = 0;
+  const Status opened = Open(facts, animation);
+  std::unique_lock lock(mutex_);
+  failure_ = opened;
+  if (opened == Status::Ok) {
+    delaysMs_ = animation->Delays();
+    rounds_ = animation->Rounds();
+    frames_.resize(delaysMs_.size());
+  }
+  while (!stop_) {
+    lock.unlock();
+    wake_();
+    lock.lock();
+    size_t frame = 0;
+    wanted_.wait(lock, [&] { return stop_ || NextFrame(frame); });
+    if (stop_) return;
+    lock.unlock();
+    ViewPicturePointer picture = Decode(frame, *facts, *animation, position);
+    lock.lock();
+    if (picture != nullptr) {
+      Take(frame, std::move(picture));
+    } else if (!stop_) {  // what is behind cannot be reached either
+      delaysMs_.resize(position);
+      frames_.resize(position);
+      shown_ = std::min(shown_, position == 0 ? 0 : position - 1);
+    }
+  }
+}
+
+}  // namespace fotomill::desktop

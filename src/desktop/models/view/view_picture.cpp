@@ -1,0 +1,267 @@
+#include "desktop/models/view/view_picture.h"
+
+#include <algorithm>
+#include <cmath>
+
+#include "core/choice_lists.h"
+#include "desktop/models/browser/browser_model.h"
+#include "desktop/models/view/photo_facts.h"
+#include "desktop/models/view/view_transform.h"
+#include "platform/clock.h"
+#include "processing/color/colour_transform.h"
+#include "processing/geometry/scale.h"
+#include "registry/registry.h"
+#include "settings/settings.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+std::vector<uint8_t> screenProfile;
+
+constexpr uint64_t kRecordBytes = 64 * 1024;  // of a decoded picture beside its pixels
+
+ScaleFilter ShrinkFilter() {
+  const ScaleFilter filter = ScaleFilterFromKey(settings.ResizeFilter);
+  return filter == ScaleFilter::Nearest ? ScaleFilter::Bilinear : filter;
+}
+
+Status Shrink(const PictureRecord& picture, int32_t width, int32_t height, ViewPixels& shrunk) {
+  return ScaleFiltered(picture.image, picture.alpha, {width, height}, ShrinkFilter(), shrunk.image, shrunk.alpha);
+}
+
+// The transform of the profile that this thread met last: pictures of a folder and frames of an animation mostly share theirs.
+const ColourTransform& TransformOf(const std::vector<uint8_t>& profile) {
+  thread_local std::vector<uint8_t> last;
+  thread_local std::unique_ptr<ColourTransform> transform;
+  if (transform == nullptr || profile != last) {
+    transform = std::make_unique<ColourTransform>(profile, screenProfile);
+    last = profile;
+  }
+  return *transform;
+}
+
+Status LoadInto(const ViewWish& wish, ViewPicture& view) {
+  PicturePointer picture;
+  RETURN_IF_BAD(LoadPictureInfo(wish.path.c_str(), picture));
+  picture->page = wish.page;
+  RETURN_IF_BAD(ReadPicture(*picture));
+  return PrepareView(std::move(picture), view);
+}
+
+}  // namespace
+
+void SetScreenProfile(std::vector<uint8_t> profile) { screenProfile = std::move(profile); }
+
+ViewLook ViewLook::FromSettings() { return {settings.ViewModeColorProfiles != 0, settings.ViewModeCheckerboard != 0}; }
+
+uint64_t ViewPicture::Bytes() const {
+  const auto bytes = [](const PackedImage& image, const PackedImage& alpha) {
+    return image.Bytes().size() + alpha.Bytes().size();
+  };
+  return kRecordBytes + bytes(fitted.image, fitted.alpha) + (picture == nullptr ? 0 : bytes(picture->image, picture->alpha));
+}
+
+Status PrepareView(PicturePointer picture, ViewPicture& view) {
+  const ViewWish& wish = view.wish;
+  // Before the background joins in, whose colour is the screen's.
+  const bool profiles = !picture->metadata.icc.empty() || !screenProfile.empty();
+  if (wish.look.profiles && profiles) TransformOf(picture->metadata.icc).Apply(picture->image);
+  if (wish.look.keepAlpha) {
+    RETURN_IF_BAD(PrepareWithAlpha(*picture));
+  } else {
+    RETURN_IF_BAD(PrepareForDisplay(*picture, static_cast<Color>(settings.ViewModeBackground)));
+  }
+  view.photo = PhotoFacts(picture->metadata.exif);
+  ViewTransform fit;
+  fit.SetPicture(picture->image.Width(), picture->image.Height());
+  fit.SetWindow(wish.fitWidth, wish.fitHeight);
+  if (wish.fitWidth > 0 && fit.Scale() < 1) {
+    RETURN_IF_BAD(Shrink(*picture, fit.ShownWidth(), fit.ShownHeight(), view.fitted));
+  }
+  view.picture = std::move(picture);
+  return Status::Ok;
+}
+
+std::string SizeAndZoom(const PictureRecord& picture, double scale) {
+  return std::to_string(picture.image.Width()) + " x " + std::to_string(picture.image.Height()) + " pixels, " +
+         SizeText(picture.fileSize, choice::kSizeFitting) + ", " + std::to_string(std::lround(scale * 100)) + "%";
+}
+
+bool ViewPicture::HasChanged() const {
+  const platform::FileFacts now = platform::FactsOf(wish.path);
+  return now.identity != facts.identity || now.device != facts.device || now.size != facts.size || now.modified != facts.modified;
+}
+
+Status PixelsForOthers(const ViewPicture& view, Color background, RgbImage& pixels) {
+  RETURN_IF_BAD(ToRgb(view.picture->image, view.picture->alpha, background, pixels));
+  if (!view.wish.look.profiles || screenProfile.empty()) return Status::Ok;
+  PackedImage image;
+  RETURN_IF_BAD(ToPacked(pixels, image));
+  ColourTransform(screenProfile).Apply(image);
+  return ToRgb(image, pixels);
+}
+
+ViewPicturePointer LoadViewPicture(const ViewWish& wish) {
+  const double start = platform::MonotonicSeconds();
+  auto view = std::make_shared<ViewPicture>();
+  view->wish = wish;
+  view->facts = platform::FactsOf(wish.path);
+  view->status = LoadInto(wish, *view);
+  view->seconds = platform::MonotonicSeconds() - start;
+  return view;
+}
+
+ViewPicturePointer TurnedView(const ViewPicture& view, Orientation turn) {
+  const PictureRecord& old = *view.picture;
+  auto turned = std::make_shared<ViewPicture>();
+  turned->wish = view.wish;
+  turned->facts = view.facts;
+  turned->photo = view.photo;
+  turned->picture = NewPictureRecord();
+  if (turned->picture == nullptr) return nullptr;
+  PictureRecord& picture = *turned->picture;
+  if (OrientImage(old.image, turn, picture.image) != Status::Ok) return nullptr;
+  if (!old.alpha.Empty() && OrientImage(old.alpha, turn, picture.alpha) != Status::Ok) return nullptr;
+  picture.width = picture.image.Width();
+  picture.height = picture.image.Height();
+  picture.bitsPerPixel = old.bitsPerPixel;
+  picture.palette = old.palette;
+  picture.alphaFlags = old.alphaFlags;
+  picture.fileName = old.fileName;
+  picture.fileSize = old.fileSize;
+  picture.formatIndex = old.formatIndex;
+  picture.pageCount = old.pageCount;
+  picture.page = old.page;
+  return turned;
+}
+
+ViewLoader::ViewLoader(uint64_t capacity, std::function<void()> wake)
+    : capacity_(capacity), wake_(std::move(wake)), worker_([this] { Work(); }) {}
+
+ViewLoader::~ViewLoader() {
+  {
+    const std::lock_guard lock(mutex_);
+    stop_ = true;
+  }
+  wanted_.notify_all();
+  worker_.join();
+}
+
+void ViewLoader::Want(std::vector<ViewWish> wishes) {
+  {
+    const std::lock_guard lock(mutex_);
+    wishes_ = std::move(wishes);
+    full_ = false;
+    DropUnwanted();
+  }
+  wanted_.notify_all();
+}
+
+ViewPicturePointer ViewLoader::Find(const ViewWish& wish) const {
+  const std::lock_guard lock(mutex_);
+  for (const ViewPicturePointer& picture : pictures_) {
+    if (picture->wish.SamePicture(wish)) return picture;
+  }
+  return nullptr;
+}
+
+void ViewLoader::Forget(const std::string& path) {
+  const std::lock_guard lock(mutex_);
+  std::erase_if(pictures_, [&](const ViewPicturePointer& picture) { return picture->wish.path == path; });
+}
+
+// The most urgent wish that has no picture yet and may still have one.
+bool ViewLoader::NextWish(ViewWish& wish) {
+  if (full_) return false;
+  for (const ViewWish& candidate : wishes_) {
+    const bool there = std::any_of(pictures_.begin(), pictures_.end(),
+                                   [&](const ViewPicturePointer& picture) { return picture->wish.SamePicture(candidate); });
+    if (there) continue;
+    wish = candidate;
+    return true;
+  }
+  return false;
+}
+
+// Pictures that nobody wants go, then, from the least urgent on, those beyond the capacity.
+void ViewLoader::DropUnwanted() {
+  std::vector<ViewPicturePointer> kept;
+  uint64_t bytes = 0;
+  for (const ViewWish& wish : wishes_) {
+    for (const ViewPicturePointer& picture : pictures_) {
+      if (!picture->wish.SamePicture(wish)) continue;
+      if (!kept.empty() && bytes + picture->Bytes() > capacity_) {
+        full_ = true;
+        continue;
+      }
+      bytes += picture->Bytes();
+      kept.push_back(picture);
+    }
+  }
+  pictures_ = std::move(kept);
+}
+
+void ViewLoader::Work() {
+  std::unique_lock lock(mutex_);
+  ViewWish wish;
+  while (true) {
+    wanted_.wait(lock, [&] { return stop_ || NextWish(wish); });
+    if (stop_) return;
+    lock.unlock();
+    ViewPicturePointer picture = LoadViewPicture(wish);
+    lock.lock();
+    pictures_.push_back(std::move(picture));
+    DropUnwanted();
+    lock.unlock();
+    wake_();
+    lock.lock();
+  }
+}
+
+ViewScaler::ViewScaler(std::function<void()> wake) : wake_(std::move(wake)), worker_([this] { Work(); }) {}
+
+ViewScaler::~ViewScaler() {
+  {
+    const std::lock_guard lock(mutex_);
+    stop_ = true;
+  }
+  requested_.notify_all();
+  worker_.join();
+}
+
+void ViewScaler::Request(ViewPicturePointer picture, int32_t width, int32_t height) {
+  {
+    const std::lock_guard lock(mutex_);
+    request_ = std::move(picture);
+    width_ = width;
+    height_ = height;
+  }
+  requested_.notify_all();
+}
+
+std::unique_ptr<ViewScaler::Scaled> ViewScaler::Take() {
+  const std::lock_guard lock(mutex_);
+  return std::move(finished_);
+}
+
+void ViewScaler::Work() {
+  std::unique_lock lock(mutex_);
+  while (true) {
+    requested_.wait(lock, [this] { return stop_ || request_ != nullptr; });
+    if (stop_) return;
+    auto scaled = std::make_unique<Scaled>();
+    scaled->picture = std::exchange(request_, nullptr);
+    const int32_t width = width_, height = height_;
+    lock.unlock();
+    const Status status = Shrink(*scaled->picture->picture, width, height, scaled->pixels);
+    lock.lock();
+    if (status != Status::Ok || request_ != nullptr) continue;
+    finished_ = std::move(scaled);
+    lock.unlock();
+    wake_();
+    lock.lock();
+  }
+}
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,137 @@
+#pragma once
+
+#include <condition_variable>
+#include <functional>
+#include <memory>
+#include <mutex>
+#include <string>
+#include <thread>
+#include <vector>
+
+#include "core/status.h"
+#include "desktop/models/view/rgb_image.h"
+#include "picture/picture_record.h"
+#include "platform/files.h"
+#include "processing/geometry/orient.h"
+
+namespace fotomill::desktop {
+
+// How a picture is to look, whichever it is.
+struct ViewLook {
+  bool profiles = false;   // in the colours that its colour profile means
+  bool keepAlpha = false;  // with its alpha plane, instead of on ViewModeBackground
+
+  static ViewLook FromSettings();
+  bool operator==(const ViewLook&) const = default;
+};
+
+// The colour profile of the screen that pictures are made for from here on; empty for sRGB. To be told before the first picture
+// is wished for.
+void SetScreenProfile(std::vector<uint8_t> profile);
+
+// A picture as a view window wants it: a page of a file, with the size of the window that it is to fit.
+struct ViewWish {
+  std::string path;
+  int32_t page = 0;
+  int32_t fitWidth = 0, fitHeight = 0;  // device pixels, 0 for none
+  ViewLook look = ViewLook::FromSettings();
+
+  bool SamePicture(const ViewWish& other) const { return path == other.path && page == other.page && look == other.look; }
+};
+
+// Pixels of 24 bits with their alpha plane, which is empty where all are opaque.
+struct ViewPixels {
+  PackedImage image, alpha;
+};
+
+// A decoded picture: upright, 24 bits, with an alpha plane only if its look wants it and not all of it is opaque.
+struct ViewPicture {
+  ViewWish wish;
+  platform::FileFacts facts;  // of the file, as it was read
+  Status status = Status::Ok;
+  PicturePointer picture;          // null unless Ok
+  ViewPixels fitted;               // as large as the fit of the wish's window; empty where that is the picture's own size or more
+  std::vector<std::string> photo;  // what the camera wrote about it, in lines
+  double seconds = 0;              // that decoding took
+
+  uint64_t Bytes() const;
+  // Whether the file has become another one since.
+  bool HasChanged() const;
+};
+using ViewPicturePointer = std::shared_ptr<const ViewPicture>;
+
+// "4000 x 3000 pixels, 3.2 MB, 25%" of a picture at a scale.
+std::string SizeAndZoom(const PictureRecord& picture, double scale);
+
+// A decoded picture's pixels for other programs: on a background, 0x00BBGGRR, and in sRGB whatever the screen's colours are.
+Status PixelsForOthers(const ViewPicture& view, Color background, RgbImage& pixels);
+
+// Makes a decoded picture what the wish of `view` asks for. Statuses of PrepareForDisplay.
+Status PrepareView(PicturePointer picture, ViewPicture& view);
+ViewPicturePointer LoadViewPicture(const ViewWish& wish);
+// A turned copy of a picture that was loaded; null where there is no memory for it.
+ViewPicturePointer TurnedView(const ViewPicture& view, Orientation turn);
+
+// Decodes pictures ahead on a thread of its own, and keeps those that are wanted up to a number of bytes.
+class ViewLoader {
+ public:
+  // `wake` is called on the loader's thread whenever a wanted picture is there.
+  ViewLoader(uint64_t capacity, std::function<void()> wake);
+  ~ViewLoader();
+  ViewLoader(const ViewLoader&) = delete;
+  ViewLoader& operator=(const ViewLoader&) = delete;
+
+  // What is wanted from here on, most urgent first. Pictures that are not among these are given back; what does not fit
+  // into the capacity beside more urgent ones is not decoded, the first one always is.
+  void Want(std::vector<ViewWish> wishes);
+  // The picture of a wish if it is there, whatever window it was fitted to.
+  ViewPicturePointer Find(const ViewWish& wish) const;
+  // Forgets a picture whose file has changed.
+  void Forget(const std::string& path);
+
+ private:
+  void Work();
+  bool NextWish(ViewWish& wish);
+  void DropUnwanted();
+
+  const uint64_t capacity_;
+  const std::function<void()> wake_;
+  mutable std::mutex mutex_;
+  std::condition_variable wanted_;
+  std::vector<ViewWish> wishes_;
+  std::vector<ViewPicturePointer> pictures_;
+  bool full_ = false;
+  bool stop_ = false;
+  std::thread worker_;
+};
+
+// Scales pictures on a thread of its own; only the latest request counts.
+class ViewScaler {
+ public:
+  explicit ViewScaler(std::function<void()> wake);
+  ~ViewScaler();
+  ViewScaler(const ViewScaler&) = delete;
+  ViewScaler& operator=(const ViewScaler&) = delete;
+
+  void Request(ViewPicturePointer picture, int32_t width, int32_t height);
+  struct Scaled {
+    ViewPicturePointer picture;
+    ViewPixels pixels;
+  };
+  // What was finished since the last call, null if nothing.
+  std::unique_ptr<Scaled> Take();
+
+ private:
+  void Work();
+
+  const std::function<void()> wake_;
+  std::mutex mutex_;
+  std::condition_variable requested_;
+  ViewPicturePointer request_;
+  int32_t width_ = 0, height_ = 0;
+  std::unique_ptr<Scaled> finished_;
+  bool stop_ = false;
+  std::thread worker_;
+};
+
+}  // namespace fotomill::desktop

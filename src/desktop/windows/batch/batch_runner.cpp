@@ -1,0 +1,208 @@
+#include "desktop/windows/batch/batch_runner.h"
+
+#include <wx/msgdlg.h>
+#include <wx/textdlg.h>
+
+#include "batch/abort.h"
+#include "batch/turn_run.h"
+#include "desktop/models/batch/destination_choice.h"
+#include "desktop/models/browser/event_log.h"
+#include "desktop/models/browser/previous_file.h"
+#include "desktop/windows/batch/destination_dialog.h"
+#include "desktop/windows/batch/overwrite_dialog.h"
+#include "desktop/windows/batch/progress_window.h"
+#include "desktop/windows/batch/prompt_for_destination.h"
+#include "desktop/windows/shell/file_actions.h"
+#include "desktop/windows/shell/main_frame.h"
+#include "desktop/windows/shell/notification.h"
+#include "desktop/windows/shell/wx_text.h"
+#include "platform/folders.h"
+#include "platform/paths.h"
+#include "settings/configuration.h"
+#include "settings/settings.h"
+
+namespace fotomill::desktop {
+
+BatchRunner::BatchRunner(MainFrame& frame) : frame_(frame) {
+  thread_ = std::make_unique<BatchThread>(
+      *this, [this](std::function<void()> action) { CallAfter([action = std::move(action)] { action(); }); });
+}
+
+BatchRunner::~BatchRunner() { thread_.reset(); }
+
+void BatchRunner::Run(std::vector<BatchFile> files, BatchFunction function, BatchJob job) {
+  Run(std::move(job), [files = std::move(files), function = std::move(function)](BatchJob& running) {
+    return RunBatch(files, function, running);
+  });
+}
+
+void BatchRunner::Run(BatchJob job, BatchThread::Work work, std::shared_ptr<PreviousFiles> previous) {
+  waiting_.push_back({std::move(job), std::move(work), std::move(previous)});
+  if (!Running()) {
+    StartNext();
+  } else {
+    frame_.Tell("The batch begins when the one before has ended.");
+    TellWaiting();
+  }
+}
+
+void BatchRunner::TellWaiting() {
+  LogEvent("batch", "waiting=" + std::to_string(waiting_.size()));
+  if (box_ != nullptr) box_->SetWaiting(waiting_.size());
+}
+
+void BatchRunner::StartNext() {
+  if (waiting_.empty()) return;
+  LeaveBox();
+  written_ = {DeedKind::Create, {}};
+  failed_ = 0;
+  Waiting next = std::move(waiting_.front());
+  waiting_.pop_front();
+  previous_ = std::move(next.previous);
+  thread_->StartWork(std::move(next.job), std::move(next.work));
+}
+
+// A box that stays to be read does so, whatever batch comes after it; another one goes.
+void BatchRunner::LeaveBox() {
+  if (box_ != nullptr && box_->StaysOpen()) box_ = nullptr;
+  CloseBox();
+}
+
+void BatchRunner::CloseBox() {
+  if (box_ != nullptr) std::exchange(box_, nullptr)->Destroy();
+}
+
+wxWindow* BatchRunner::DialogParent() const { return box_ != nullptr ? static_cast<wxWindow*>(box_) : &frame_; }
+
+// --- the progress box ---
+
+void BatchRunner::BatchOpened() {
+  ProgressWindow::Events events;
+  events.abort = [] { Abort(); };
+  events.closed = [this](ProgressWindow& box) {
+    if (box_ == &box) box_ = nullptr;
+    box.Destroy();
+  };
+  events.selectFailed = [this](const std::vector<std::string>& files) { frame_.SelectFiles(files); };
+  LeaveBox();
+  box_ = new ProgressWindow(&frame_, frame_.Thumbnails(), events);
+  box_->Show();
+  TellWaiting();
+  LogEvent("batch", "opened");
+}
+
+void BatchRunner::BatchLine(const ProgressLine& line, const FileOutcome& outcome) {
+  LogEvent("batch-line", line.text);
+  failed_ += line.item.file >= 0 && outcome.status != Status::Ok && !outcome.skipped;
+  if (box_ != nullptr) box_->AddLine(line, outcome.source);
+  const bool written = outcome.status == Status::Ok && !outcome.skipped && !outcome.replaced && !outcome.destination.empty();
+  if (written) written_.steps.push_back({outcome.source, platform::AbsolutePath(outcome.destination)});
+}
+
+void BatchRunner::BatchStatus(const std::string& status) {
+  if (box_ != nullptr) box_->SetStatus(status);
+}
+
+void BatchRunner::BatchProgress(uint32_t done, uint32_t count) {
+  if (box_ != nullptr) box_->SetProgress(done, count);
+}
+
+// Whether the user saw the end is told before the box moves the keyboard.
+void BatchRunner::BatchStaysOpen(const ProgressModel& model) {
+  seen_ = InFront();
+  LogEvent("batch", "stays-open files=" + std::to_string(model.Files()));
+  if (box_ != nullptr) box_->StayOpen();
+}
+
+void BatchRunner::BatchCloses() {
+  seen_ = InFront();
+  LogEvent("batch", "closes");
+  CloseBox();
+}
+
+void BatchRunner::BatchEnded(Status status, const BatchJob& job) {
+  LogEvent("batch", "ended status=" + std::to_string(StatusNumber(status)));
+  frame_.NoteUses(job.uses);
+  // Outputs, not files that were given other names.
+  if (job.formatIndex != kNoFormat) frame_.Files().NoteDone(std::exchange(written_, {}));
+  if (previous_ != nullptr) frame_.Files().NoteDone(std::exchange(previous_, nullptr)->Deed());
+  if (job.filesChanged) frame_.FilesChanged();
+  if (!seen_)
+    NotifyUser(frame_, failed_ == 0 ? "Batch finished" : "Batch finished with errors", Shown(CountLine(job.progress.Files())));
+  if (status == Status::Ok) frame_.Tell(CountLine(job.progress.Files()));
+  CallAfter([this] { StartNext(); });
+}
+
+// --- questions ---
+
+OverwriteAnswer BatchRunner::AskOverwrite(const OverwriteQuestion& question, const OverwritePreview& preview) {
+  OverwriteDialog dialog(DialogParent(), question, preview);
+  LogEvent("prompt", "overwrite " + question.path);
+  dialog.ShowModal();
+  return dialog.Answer();
+}
+
+std::optional<std::string> BatchRunner::AskDestinationName(const NameQuestion& question) {
+  const wxString problem = question.problem.empty() ? wxString() : Shown(question.problem) + "\n";
+  wxTextEntryDialog dialog(DialogParent(), problem + "Write " + Shown(platform::FileNameOf(question.source)) + " to:",
+                           question.title.empty() ? wxString("Destination name") : Shown(question.title),
+                           wxString::FromUTF8(question.path));
+  LogEvent("prompt", "name " + question.path);
+  if (dialog.ShowModal() != wxID_OK) return std::nullopt;
+  return Utf8(dialog.GetValue());
+}
+
+std::optional<std::string> BatchRunner::AskPassword(const std::string& path) {
+  wxPasswordEntryDialog dialog(DialogParent(), "Password for " + Shown(platform::FileNameOf(path)) + ":", "Password");
+  LogEvent("prompt", "password " + path);
+  if (dialog.ShowModal() != wxID_OK) return std::nullopt;
+  return Utf8(dialog.GetValue());
+}
+
+bool BatchRunner::ConfirmFormat(const std::string& question) {
+  LogEvent("prompt", "format " + question);
+  return PromptForDestination(*DialogParent(), question);
+}
+
+bool BatchRunner::Confirm(const std::string& question, const std::string& yes) {
+  wxMessageDialog dialog(DialogParent(), Shown(question), "Fotomill Professional", wxOK | wxCANCEL | wxICON_QUESTION);
+  dialog.SetOKLabel(Shown(yes));
+  LogEvent("prompt", "confirm " + question);
+  return dialog.ShowModal() == wxID_OK;
+}
+
+void BatchRunner::StoreFlag(KeyNumber key, bool value) {
+  SettingValue flag;
+  flag.number = value ? 1 : 0;
+  if (StoreSetting(KeyOf(key), flag) != SaveResult::Done) StoreNumber(KeyOf(key), flag.number);
+}
+
+void TurnSelection(MainFrame& frame, Orientation turn) {
+  std::vector<BatchFile> files;
+  for (const std::string& file : frame.SelectedFiles()) files.push_back({.name = file, .below = {}, .hint = {}});
+  if (files.empty()) return;
+  auto previous = std::make_shared<PreviousFiles>();
+  TurnFunction function{.request = {.turn = turn, .seenByExif = settings.ExifAdjustOrientation != 0}, .inPlace = true};
+  function.keepPrevious = [previous](const std::string& path) { return previous->Keep(path); };
+  function.replaced = [previous](const std::string& path) { previous->Replaced(path); };
+  frame.Batches().Run(
+      BatchJob(), [files, function](BatchJob& job) { return RunTurn(files, function, job); }, previous);
+}
+
+void ConvertSelection(MainFrame& frame) {
+  const std::vector<std::string> files = frame.SelectedFiles();
+  if (files.empty()) return;
+  DestinationDialog dialog(&frame, "Convert", files);
+  LogEvent("prompt", "destination");
+  if (dialog.ShowModal() != wxID_OK) return;
+  const DestinationChoice choice = dialog.Choice();
+  std::vector<BatchFile> batch;
+  for (const std::string& file : files) batch.push_back({.name = file, .below = {}, .hint = {}});
+  BatchFunction function;
+  function.reduce = choice.reduce;
+  function.autoOrient = choice.autoOrient;
+  function.keepMetadata = choice.keepMetadata;
+  frame.Batches().Run(std::move(batch), std::move(function), JobFor(choice));
+}
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,47 @@
+#pragma once
+
+#include <wx/dialog.h>
+
+#include <string>
+#include <vector>
+
+#include "desktop/models/batch/destination_choice.h"
+
+class wxButton;
+class wxCheckBox;
+class wxChoice;
+class wxComboBox;
+class wxRadioButton;
+class wxStaticText;
+
+namespace fotomill::desktop {
+
+// The destination step of a function: format, folder, and what becomes of colours and metadata.
+class DestinationDialog : public wxDialog {
+ public:
+  // `verb` is what OK does: "Convert".
+  DestinationDialog(wxWindow* parent, const wxString& verb, const std::vector<std::string>& files);
+  DestinationChoice Choice() const;
+
+ private:
+  void UpdateControls();
+  void ShowFormatOptions();
+  void Browse();
+  void OnOk(wxCommandEvent& event);
+
+  const std::vector<std::string> files_;
+  const std::vector<DestinationFormat> formats_ = DestinationFormats();
+  wxChoice* format_ = nullptr;
+  wxButton* options_ = nullptr;
+  wxRadioButton* beside_ = nullptr;
+  wxRadioButton* into_ = nullptr;
+  wxComboBox* folder_ = nullptr;
+  wxButton* browse_ = nullptr;
+  wxCheckBox* reduce_ = nullptr;
+  wxCheckBox* orient_ = nullptr;
+  wxCheckBox* metadata_ = nullptr;
+  wxStaticText* preview_ = nullptr;
+  wxButton* ok_ = nullptr;
+};
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,80 @@
+#pragma once
+
+#include <wx/frame.h>
+#include <wx/gauge.h>
+#include <wx/timer.h>
+
+#include <functional>
+#include <string>
+#include <vector>
+
+#include "batch/progress_model.h"
+#include "desktop/windows/browser/thumbnail_service.h"
+
+class wxButton;
+class wxStaticText;
+class wxVListBox;
+
+namespace fotomill::desktop {
+
+// The progress box: lists files as they are processed, with Abort while the batch runs and Close after it. Not modal.
+class ProgressWindow : public wxFrame {
+ public:
+  struct Events {
+    std::function<void()> abort;
+    std::function<void(ProgressWindow& box)> closed;                          // the user is done with the box
+    std::function<void(const std::vector<std::string>& files)> selectFailed;  // shows the failed files in their browser
+  };
+  ProgressWindow(wxWindow* frame, ThumbnailService& thumbnails, Events events);
+
+  void AddLine(const ProgressLine& line, const std::string& source);
+  void SetStatus(const std::string& status);
+  void SetProgress(uint32_t done, uint32_t count);
+  // How many batches wait for this one.
+  void SetWaiting(size_t batches);
+  // The batch has ended and the box stays: closing lines are there, Close is live.
+  void StayOpen();
+  bool StaysOpen() const { return done_; }
+
+ private:
+  class DrawnList;
+  class PlainList;
+  struct Row {
+    ProgressLine line;
+    std::string source;
+  };
+  wxWindow* MakeList(bool scrollBar);
+  wxSize InUnits(const wxSize& pixels) const;
+  wxRect InPixels(const Rectangle& units) const;
+  void LayOut();
+  // Shows what has come since the last time: many lines at once cost as much as one.
+  void GatherNews();
+  void ShowNews();
+  void CopyList();
+  std::vector<std::string> FailedFiles() const;
+  int FirstVisible() const;
+  void ShowFrom(int row, int selected);
+
+  const Events events_;
+  ThumbnailService& thumbnails_;
+  const ProgressSettings settings_;
+  std::vector<Row> rows_;
+  double started_ = 0;
+  bool done_ = false;
+  std::string text_;  // of the status line, without the time left
+  uint32_t fileDone_ = 0, fileCount_ = 0;
+  size_t waiting_ = 0;
+  wxTimer newsTimer_;
+  wxWindow* panel_ = nullptr;
+  wxWindow* list_ = nullptr;
+  DrawnList* drawn_ = nullptr;  // the list, when the box draws it
+  PlainList* plain_ = nullptr;  // the list, when it is one of texts
+  wxStaticText* status_ = nullptr;
+  wxGauge* bar_ = nullptr;
+  wxButton* abort_ = nullptr;
+  wxButton* close_ = nullptr;
+  wxButton* copy_ = nullptr;  // what the errors leave to do; hidden until there are some
+  wxButton* select_ = nullptr;
+};
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,358 @@
+#include "desktop/windows/browser/browser_page.h"
+
+#include <wx/dataobj.h>
+#include <wx/dnd.h>
+#include <wx/simplebook.h>
+#include <wx/sizer.h>
+#include <wx/srchctrl.h>
+#include <wx/textdlg.h>
+
+#include <algorithm>
+
+#include "core/choice_lists.h"
+#include "desktop/models/browser/event_log.h"
+#include "desktop/windows/browser/details_list.h"
+#include "desktop/windows/browser/folder_drop.h"
+#include "desktop/windows/browser/path_bar.h"
+#include "desktop/windows/browser/thumbnail_canvas.h"
+#include "desktop/windows/browser/update_bar.h"
+#include "desktop/windows/shell/wx_text.h"
+#include "platform/folders.h"
+#include "platform/paths.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+enum View { kThumbnailView, kDetailsView };  // pages of the book, the second made when it is first shown
+
+}  // namespace
+
+BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& thumbnails, const FolderView& view)
+    : wxPanel(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTAB_TRAVERSAL | wxBORDER_NONE, "Browser"),
+      host_(host),
+      thumbnails_(thumbnails),
+      base_(view),
+      reader_({[this](FolderListing listing, bool complete) { TakeListing(std::move(listing), complete); },
+               [this](const PlacedItems& found, bool last) { TakeFacts(found, last); }}),
+      watch_([this] { Reload(); }),
+      offer_(this, {[this] { FocusList(); }, [this] { canvas_->WantThumbnails(); }}) {
+  model_.SetView(view);
+  auto* bar = new wxBoxSizer(wxHORIZONTAL);
+  path_ = new PathBar(this, trail_,
+                      {[this](int steps) { StepAlongTrail(steps); }, [this] { GoUp(); },
+                       [this](const std::string& folder) {
+                         Open(folder);
+                         FocusList();
+                       },
+                       [this] { LeaveBar(); }});
+  bar->Add(path_, wxSizerFlags(1).CenterVertical());
+  BuildFilter();
+  bar->Add(filter_, wxSizerFlags().CenterVertical().Border(wxRIGHT, FromDIP(4)));
+  BuildViews();
+  auto* sizer = new wxBoxSizer(wxVERTICAL);
+  sizer->Add(bar, wxSizerFlags().Expand());
+  offer_.Bar()->MoveBeforeInTabOrder(views_);
+  sizer->Add(offer_.Bar(), wxSizerFlags().Expand());
+  sizer->Add(views_, wxSizerFlags(1).Expand());
+  SetSizer(sizer);
+  SetDropTarget(new FolderDrop([this](const wxPoint&) { return model_.Folder(); },
+                               [this](const std::vector<std::string>& files, const std::string& folder, bool move) {
+                                 host_.DropFiles(files, folder, move);
+                               }));
+}
+
+void BrowserPage::BuildFilter() {
+  filter_ = new wxSearchCtrl(this, wxID_ANY, "", wxDefaultPosition, FromDIP(wxSize(200, -1)), wxTE_PROCESS_ENTER,
+                             wxDefaultValidator, "Filter");
+  filter_->SetDescriptiveText("Filter");
+  filter_->ShowCancelButton(true);
+  filter_->SetToolTip("Shows only files whose names contain this, or match its * and ?");
+  filter_->Bind(wxEVT_TEXT, [this](wxCommandEvent&) { ApplyFilter(); });
+  filter_->Bind(wxEVT_SEARCHCTRL_CANCEL_BTN, [this](wxCommandEvent&) { filter_->Clear(); });
+  filter_->Bind(wxEVT_TEXT_ENTER, [this](wxCommandEvent&) { FocusList(); });
+  filter_->Bind(wxEVT_CHAR_HOOK, [this](wxKeyEvent& event) {
+    if (event.GetKeyCode() != WXK_ESCAPE) return event.Skip();
+    LeaveBar();
+  });
+}
+
+void BrowserPage::BuildViews() {
+  views_ = new wxSimplebook(this);
+  ThumbnailCanvas::Events events;
+  events.selectionChanged = [this] { host_.BrowserChanged(); };
+  events.activated = [this](size_t line) { Activate(line); };
+  events.contextMenu = [this](size_t line, const wxPoint& place) { host_.ShowContextMenu(*canvas_, place, line != kNoLine); };
+  events.dragBegins = [this] { BeginDrag(); };
+  events.resize = [this](int steps) { ChangeSize(steps); };
+  events.renamed = [this](size_t line, const std::string& name) { host_.RenameFile(model_.PathOfLine(line), name); };
+  canvas_ = new ThumbnailCanvas(views_, model_, thumbnails_, events);
+  views_->AddPage(canvas_, "Thumbnails");
+}
+
+// --- folders ---
+
+void BrowserPage::Open(const std::string& folder, const std::string& focus) {
+  if (folder != model_.Folder()) trail_.Go(folder);
+  ShowFolder(folder, focus);
+}
+
+void BrowserPage::StepAlongTrail(int steps) {
+  if (!trail_.CanStep(steps)) return;
+  const std::string left(platform::FileNameOf(model_.Folder()));
+  ShowFolder(trail_.Step(steps), steps < 0 ? left : std::string());
+}
+
+void BrowserPage::GoUp() {
+  const std::string parent = platform::AbsolutePath(platform::JoinFolder(model_.Folder(), ".."));
+  if (parent != model_.Folder()) Open(parent, std::string(platform::FileNameOf(model_.Folder())));
+}
+
+void BrowserPage::ShowFolder(const std::string& folder, const std::string& focus) {
+  wantedFocus_ = focus;
+  if (folder == model_.Folder()) return Reload();
+  watch_.Watch({});
+  offer_.Forget();
+  model_.SetFolder(folder);
+  TakeViewOf(folder);
+  filter_->ChangeValue("");
+  path_->ShowFolder(folder);
+  canvas_->ScrollTo(0);
+  ShowView();
+  Reload();
+  host_.BrowserChanged();
+}
+
+// How the folder was last asked to be shown, else as all folders are here; what the folder itself says wins, and goes on.
+void BrowserPage::TakeViewOf(const std::string& folder) {
+  const FolderView kept = host_.Views().Find(folder, base_);
+  FolderView view = kept;
+  view.modes = ModesForFolder(folder, kept.modes);
+  if (view != kept) base_ = view;
+  model_.SetView(view);
+}
+
+void BrowserPage::Reload() { reader_.List(model_.Folder(), model_.ItemCount() == 0); }
+
+void BrowserPage::TakeListing(FolderListing listing, bool complete) {
+  const size_t count = listing.items.size();
+  model_.SetItems(std::move(listing.items));
+  LogEvent(complete ? "listed" : "names", std::to_string(count) + " " + model_.Folder());
+  if (!wantedFocus_.empty()) {
+    const size_t line = model_.FindLine(wantedFocus_);
+    if (line != kNoLine) model_.Selected().SelectOnly(line);
+  }
+  if (model_.Selected().Focus() == kNoLine && model_.LineCount() > 0) model_.Selected().MoveFocus(0, false, true);
+  ShowLines();
+  if (!ShowsDetails()) {
+    if (wantedScroll_ >= 0) canvas_->ScrollTo(wantedScroll_);
+    if (!wantedFocus_.empty()) canvas_->ShowLine(model_.Selected().Focus());
+  }
+  if (complete) {
+    watch_.Watch(model_.Folder());
+    StartFacts();
+    OfferThumbnails();
+    wantedFocus_.clear();
+    wantedScroll_ = -1;
+  }
+  host_.BrowserChanged();
+}
+
+void BrowserPage::OfferThumbnails() {
+  if (model_.ItemCount() == 0) return;
+  std::vector<std::string> files;
+  for (size_t i = 0; i < model_.ItemCount(); ++i) {
+    if (!model_.Item(i).folder) files.push_back(model_.Item(i).name);
+  }
+  offer_.Offer(model_.Folder(), std::move(files), model_.Modes());
+}
+
+// --- what only the files' headers tell ---
+
+bool BrowserPage::NeedsFacts() const {
+  const BrowserModes& modes = model_.Modes();
+  return modes.view == choice::kViewDetails || modes.sort == choice::kSortExifDate || modes.sort == choice::kSortDimensions;
+}
+
+void BrowserPage::StartFacts() {
+  if (Listing() || reader_.ReadingFacts() || !NeedsFacts()) return;
+  PlacedItems wanted;
+  for (size_t line = 0; line < model_.LineCount(); ++line) {
+    const size_t item = model_.ItemOfLine(line);
+    if (!model_.Item(item).folder && model_.Item(item).width == 0) wanted.emplace_back(item, model_.Item(item));
+  }
+  if (!wanted.empty()) reader_.ReadFacts(model_.Folder(), std::move(wanted));
+}
+
+void BrowserPage::TakeFacts(const PlacedItems& found, bool last) {
+  for (const auto& [item, known] : found) model_.SetFacts(item, known);
+  const int32_t sort = model_.Modes().sort;
+  if (last && (sort == choice::kSortExifDate || sort == choice::kSortDimensions)) {
+    model_.UpdateOrder();
+    ShowView();
+  } else if (ShowsDetails()) {
+    details_->Refresh();
+  }
+  if (last) LogEvent("facts", model_.Folder());
+}
+
+// --- what is shown how ---
+
+bool BrowserPage::ShowsDetails() const { return views_->GetSelection() == kDetailsView; }
+
+void BrowserPage::ShowView() {
+  const bool details = model_.Modes().view == choice::kViewDetails;
+  if (details && details_ == nullptr) {
+    DetailsList::Events events;
+    events.selectionChanged = [this] { host_.BrowserChanged(); };
+    events.activated = [this](size_t line) { Activate(line); };
+    events.contextMenu = [this](size_t line, const wxPoint& place) { host_.ShowContextMenu(*details_, place, line != kNoLine); };
+    events.sort = [this](int32_t sort) { SetSort(sort, model_.Modes().sort == sort && !model_.Descending()); };
+    details_ = new DetailsList(views_, model_, host_.Columns(), events);
+    views_->AddPage(details_, "Details");
+  }
+  const bool hadFocus = canvas_->HasFocus() || (details_ != nullptr && details_->HasFocus());
+  views_->SetSelection(details ? kDetailsView : kThumbnailView);
+  ShowLines();
+  if (details) {
+    details_->ShowSelection();
+  } else {
+    canvas_->ShowLine(model_.Selected().Focus());
+  }
+  if (hadFocus) FocusList();
+  StartFacts();
+}
+
+void BrowserPage::ShowLines() {
+  if (ShowsDetails()) {
+    details_->ModelChanged();
+  } else {
+    canvas_->ModelChanged();
+  }
+}
+
+void BrowserPage::ShowAs(const FolderView& view) {
+  model_.SetView(view);
+  ShowView();
+  host_.BrowserChanged();
+}
+
+// What the user chooses is kept for this folder, and goes for folders of which nothing is kept.
+void BrowserPage::ChooseView(const FolderView& view) {
+  base_ = view;
+  host_.KeepView(model_.Folder(), view);
+  ShowAs(view);
+}
+
+void BrowserPage::SetViewMode(int32_t mode) {
+  FolderView view = model_.View();
+  view.modes.view = mode;
+  ChooseView(view);
+}
+
+void BrowserPage::SetSort(int32_t sort, bool descending) {
+  FolderView view = model_.View();
+  view.modes.sort = sort;
+  view.descending = descending;
+  ChooseView(view);
+}
+
+void BrowserPage::SetThumbnailMode(int32_t mode) {
+  FolderView view = model_.View();
+  view.modes.thumbnails = base_.modes.thumbnails = mode;
+  ShowAs(view);
+}
+
+void BrowserPage::ChangeSize(int steps) {
+  const int32_t view = std::clamp(model_.Modes().view + steps, choice::kViewList + 0, choice::kViewLarge + 0);
+  if (view != model_.Modes().view) SetViewMode(view);
+}
+
+void BrowserPage::SelectionChanged() {
+  if (ShowsDetails()) {
+    details_->ShowSelection();
+  } else {
+    canvas_->ShowLine(model_.Selected().Focus());
+    canvas_->Refresh();
+  }
+  host_.BrowserChanged();
+}
+
+void BrowserPage::FocusName(const std::string& name) {
+  const size_t line = model_.FindLine(name);
+  if (line == kNoLine) return;
+  model_.Selected().SelectOnly(line);
+  SelectionChanged();
+}
+
+void BrowserPage::EditFocusedName() {
+  const size_t focus = model_.Selected().Focus();
+  if (focus == kNoLine) return;
+  if (!ShowsDetails()) return canvas_->EditName(focus);
+  wxTextEntryDialog dialog(this, "New name:", "Rename", Shown(model_.Line(focus).name));
+  if (dialog.ShowModal() == wxID_OK) host_.RenameFile(model_.PathOfLine(focus), Utf8(dialog.GetValue()));
+}
+
+void BrowserPage::EditPath() { path_->Edit(); }
+void BrowserPage::OfferTrail() { path_->OfferTrail(); }
+
+void BrowserPage::ChooseColumns() {
+  if (!ShowsDetails()) SetViewMode(choice::kViewDetails);
+  details_->ChooseColumns();
+}
+
+void BrowserPage::KeepColumns() {
+  if (details_ != nullptr) details_->KeepColumns();
+}
+
+void BrowserPage::EditFilter() { filter_->SetFocus(); }
+
+void BrowserPage::ApplyFilter() {
+  model_.SetFilter(Utf8(filter_->GetValue()));
+  ShowLines();
+  host_.BrowserChanged();
+}
+
+void BrowserPage::LeaveBar() {
+  if (!filter_->IsEmpty()) filter_->Clear();
+  FocusList();
+}
+
+void BrowserPage::Activated() {
+  thumbnails_.SetListener([this](const std::vector<ThumbnailLoader::Result>& results) { ThumbnailsCame(results); });
+  canvas_->WantThumbnails();
+  if (details_ != nullptr) details_->ShowColumns();
+}
+
+void BrowserPage::ThumbnailsCame(const std::vector<ThumbnailLoader::Result>& results) {
+  canvas_->ThumbnailsCame(results);
+  if (EventLogOn()) host_.BrowserChanged();
+}
+
+void BrowserPage::FocusList() {
+  if (ShowsDetails()) {
+    details_->SetFocus();
+  } else {
+    canvas_->SetFocus();
+  }
+}
+
+size_t BrowserPage::MissingThumbnails() const { return ShowsDetails() ? 0 : canvas_->MissingThumbnails(); }
+int64_t BrowserPage::Scroll() const { return canvas_->Scroll(); }
+
+void BrowserPage::Activate(size_t line) {
+  const FolderItem& item = model_.Line(line);
+  const std::string path = model_.PathOfLine(line);
+  if (item.folder) return Open(path);
+  host_.ViewFile(path);
+}
+
+void BrowserPage::BeginDrag() {
+  wxFileDataObject files;
+  for (const std::string& file : model_.FilesForFunction()) files.AddFile(wxString::FromUTF8(file));
+  if (files.GetFilenames().empty()) return;
+  wxDropSource source(files, this);
+  if (source.DoDragDrop(wxDrag_AllowMove) == wxDragMove) Reload();
+}
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,150 @@
+#include "desktop/windows/browser/details_list.h"
+
+#include <wx/menu.h>
+
+#include <algorithm>
+
+#include "desktop/models/browser/event_log.h"
+#include "desktop/windows/shell/wx_text.h"
+
+namespace fotomill::desktop {
+
+class DetailsList::Lines : public wxDataViewVirtualListModel {
+ public:
+  explicit Lines(const BrowserModel& model) : model_(model) {}
+  unsigned int GetColumnCount() const { return static_cast<unsigned>(AllDetails().size()); }
+  wxString GetColumnType(unsigned int) const { return "string"; }
+  void GetValueByRow(wxVariant& value, unsigned int row, unsigned int column) const override {
+    value = row < model_.LineCount() ? Shown(AllDetails()[column].text(model_.Line(row))) : wxString();
+  }
+  bool SetValueByRow(const wxVariant&, unsigned int, unsigned int) override { return false; }
+
+ private:
+  const BrowserModel& model_;
+};
+
+DetailsList::DetailsList(wxWindow* parent, BrowserModel& model, DetailColumns& columns, Events events)
+    : wxDataViewCtrl(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxDV_MULTIPLE | wxDV_ROW_LINES | wxBORDER_NONE,
+                     wxDefaultValidator, "Details"),
+      model_(model),
+      columns_(columns),
+      events_(std::move(events)),
+      lines_(new Lines(model)) {
+  AssociateModel(lines_.get());
+  ShowColumns();
+  Bind(wxEVT_DATAVIEW_SELECTION_CHANGED, [this](wxDataViewEvent&) { ReadSelection(); });
+  Bind(wxEVT_DATAVIEW_ITEM_ACTIVATED, [this](wxDataViewEvent& event) {
+    if (event.GetItem().IsOk()) events_.activated(lines_->GetRow(event.GetItem()));
+  });
+  Bind(wxEVT_DATAVIEW_ITEM_CONTEXT_MENU, [this](wxDataViewEvent& event) {
+    const size_t line = event.GetItem().IsOk() ? lines_->GetRow(event.GetItem()) : kNoLine;
+    events_.contextMenu(line, ScreenToClient(wxGetMousePosition()));
+  });
+  Bind(wxEVT_DATAVIEW_COLUMN_HEADER_CLICK, [this](wxDataViewEvent& event) {
+    const int32_t sort = AllDetails()[event.GetDataViewColumn()->GetModelColumn()].sort;
+    if (sort >= 0) events_.sort(sort);
+  });
+  Bind(wxEVT_DATAVIEW_COLUMN_HEADER_RIGHT_CLICK, [this](wxDataViewEvent&) { CallAfter([this] { ChooseColumns(); }); });
+}
+
+// --- columns ---
+
+void DetailsList::ShowColumns() {
+  if (shown_ == columns_) return;
+  ClearColumns();
+  for (const DetailColumn& column : columns_) {
+    const DetailFacts& facts = AllDetails()[column.detail];
+    const wxAlignment alignment = facts.number ? wxALIGN_RIGHT : wxALIGN_LEFT;
+    auto* added = new wxDataViewColumn(facts.title, new wxDataViewTextRenderer("string", wxDATAVIEW_CELL_INERT, alignment),
+                                       static_cast<unsigned>(column.detail), FromDIP(column.width), alignment,
+                                       wxDATAVIEW_COL_RESIZABLE | wxDATAVIEW_COL_REORDERABLE);
+    added->SetHidden(!column.shown);
+    AppendColumn(added);
+  }
+  shown_ = columns_;
+}
+
+void DetailsList::KeepColumns() {
+  DetailColumns now;
+  for (unsigned i = 0; i < GetColumnCount(); ++i) {
+    const wxDataViewColumn* const column = GetColumn(i);
+    const size_t detail = column->GetModelColumn();
+    const auto before = std::ranges::find(shown_, detail, &DetailColumn::detail);
+    // A hidden column has no width, and the last one shown fills the list up.
+    const bool measured = column->IsShown() && column->GetWidth() > 0;
+    now.push_back({detail, measured ? ToDIP(column->GetWidth()) : before->width, column->IsShown()});
+  }
+  if (now.size() != shown_.size()) return;
+  const auto last = std::find_if(now.rbegin(), now.rend(), [](const DetailColumn& column) { return column.shown; });
+  if (last != now.rend()) last->width = std::ranges::find(shown_, last->detail, &DetailColumn::detail)->width;
+  columns_ = shown_ = now;
+}
+
+void DetailsList::ChooseColumns() {
+  wxMenu menu;
+  const int first = wxID_HIGHEST + 1;
+  KeepColumns();
+  for (const DetailColumn& column : columns_) {
+    wxMenuItem* item = menu.AppendCheckItem(first + static_cast<int>(column.detail), AllDetails()[column.detail].title);
+    item->Check(column.shown);
+    item->Enable(column.detail != 0);
+  }
+  LogEvent("column-menu");
+  const int chosen = GetPopupMenuSelectionFromUser(menu, ScreenToClient(wxGetMousePosition()));
+  if (chosen < first) return;
+  const auto column = std::ranges::find(columns_, static_cast<size_t>(chosen - first), &DetailColumn::detail);
+  column->shown = !column->shown;
+  ShowColumns();
+  ModelChanged();
+  LogEvent("columns", DetailColumnsText(columns_));
+}
+
+// --- lines ---
+
+void DetailsList::ShowLines() {
+  changing_ = true;
+  lines_->Reset(static_cast<unsigned>(model_.LineCount()));
+  changing_ = false;
+}
+
+// What stood at the top stays there, as far as it goes.
+void DetailsList::ModelChanged() {
+  const wxDataViewItem top = GetTopItem();
+  const unsigned row = top.IsOk() ? lines_->GetRow(top) : 0;
+  ShowLines();
+  ShowSelection();
+  if (row == 0 || row >= model_.LineCount()) return;
+  EnsureVisible(lines_->GetItem(static_cast<unsigned>(model_.LineCount()) - 1));
+  EnsureVisible(lines_->GetItem(row));
+}
+
+void DetailsList::ShowSelection() {
+  changing_ = true;
+  wxDataViewItemArray items;
+  for (const size_t line : model_.Selected().SelectedLines()) items.Add(lines_->GetItem(static_cast<unsigned>(line)));
+  SetSelections(items);
+  const size_t focus = model_.Selected().Focus();
+  if (focus != kNoLine) {
+    const wxDataViewItem item = lines_->GetItem(static_cast<unsigned>(focus));
+    if (model_.Selected().SelectedCount() <= 1 && model_.Selected().IsSelected(focus)) SetCurrentItem(item);
+    EnsureVisible(item);
+  }
+  changing_ = false;
+}
+
+void DetailsList::ReadSelection() {
+  if (changing_) return;
+  wxDataViewItemArray items;
+  GetSelections(items);
+  std::vector<bool> selected(model_.LineCount());
+  for (const wxDataViewItem& item : items) {
+    const unsigned row = lines_->GetRow(item);
+    if (row < selected.size()) selected[row] = true;
+  }
+  const wxDataViewItem current = GetCurrentItem();
+  const size_t focus = current.IsOk() ? lines_->GetRow(current) : model_.Selected().Focus();
+  model_.Selected().Assign(std::move(selected), focus, focus);
+  events_.selectionChanged();
+}
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,47 @@
+#include "desktop/windows/browser/folder_reader.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+constexpr size_t kBunch = 200;
+
+}  // namespace
+
+void FolderReader::List(const std::string& folder, bool namesFirst) {
+  facts_.Stop();
+  listing_.Start([this, folder, namesFirst](const std::atomic<bool>& stop, const LooseWork::Tell& tell) {
+    const auto send = [&](FolderListing listing, bool complete) {
+      tell([this, listing = std::move(listing), complete]() mutable {
+        if (complete) listing_.Stop();
+        events_.listed(std::move(listing), complete);
+      });
+    };
+    FolderListing listing = ListForBrowser(folder, false, stop);
+    if (namesFirst && !stop) send(listing, false);
+    AddFacts(folder, listing, stop);
+    if (!stop) send(std::move(listing), true);
+  });
+}
+
+void FolderReader::ReadFacts(const std::string& folder, PlacedItems wanted) {
+  facts_.Start([this, folder, wanted = std::move(wanted)](const std::atomic<bool>& stop, const LooseWork::Tell& tell) {
+    const auto send = [&](PlacedItems found, bool last) {
+      tell([this, found = std::move(found), last] {
+        if (last) facts_.Stop();
+        events_.factsFound(found, last);
+      });
+    };
+    PlacedItems found;
+    for (const auto& [place, item] : wanted) {
+      if (stop) return;
+      FolderItem facts = item;
+      AddPictureFacts(folder, facts);
+      if (facts.width > 0) found.emplace_back(place, std::move(facts));
+      if (found.size() == kBunch) send(std::exchange(found, {}), false);
+    }
+    send(std::move(found), true);
+  });
+}
+
+}  // namespace fotomill::desktop

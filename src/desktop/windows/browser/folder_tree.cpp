@@ -1,0 +1,272 @@
+#include "desktop/windows/browser/folder_tree.h"
+
+#include <wx/app.h>
+#include <wx/menu.h>
+#include <wx/textdlg.h>
+
+#include <algorithm>
+#include <thread>
+
+#include "desktop/models/browser/event_log.h"
+#include "desktop/models/browser/folder_listing.h"
+#include "desktop/windows/shell/wx_text.h"
+#include "desktop/windows/widgets/bitmaps.h"
+#include "platform/folders.h"
+#include "platform/paths.h"
+#include "platform/volumes.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+enum Image { kFolderImage, kHomeImage, kFavouriteImage, kVolumeImage };
+
+struct FolderData : wxTreeItemData {
+  explicit FolderData(std::string path) : folder(std::move(path)) {}
+  std::string folder;
+  bool filled = false;
+};
+
+}  // namespace
+
+// A folder at the top of the tree.
+struct FolderTree::Place {
+  Image image;
+  wxString label;
+  std::string folder;
+};
+
+FolderTree::FolderTree(wxWindow* parent, const Favourites& favourites, Events events)
+    : wxTreeCtrl(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize,
+                 wxTR_HAS_BUTTONS | wxTR_HIDE_ROOT | wxTR_LINES_AT_ROOT | wxTR_NO_LINES | wxTR_FULL_ROW_HIGHLIGHT | wxBORDER_NONE,
+                 wxDefaultValidator, "Folders"),
+      favourites_(favourites),
+      events_(std::move(events)) {
+  TakeImages();
+  Bind(wxEVT_SYS_COLOUR_CHANGED, [this](wxSysColourChangedEvent& event) {
+    TakeImages();
+    event.Skip();
+  });
+  AddRoot("");
+  UpdatePlaces();
+  // What is not read yet opens when it has been.
+  Bind(wxEVT_TREE_ITEM_EXPANDING, [this](wxTreeEvent& event) {
+    if (GetChildrenCount(event.GetItem(), false) > 0) return;
+    opening_.insert(FolderOf(event.GetItem()));
+    Fill(event.GetItem());
+    event.Veto();
+  });
+  Bind(wxEVT_TREE_SEL_CHANGED, [this](wxTreeEvent& event) {
+    const std::string folder = FolderOf(event.GetItem());
+    if (following_ || folder.empty()) return;
+    followed_ = folder;
+    events_.chosen(folder);
+  });
+  Bind(wxEVT_TREE_ITEM_MENU, [this](wxTreeEvent& event) { ShowMenu(event.GetItem(), event.GetPoint()); });
+}
+
+// In the colour of texts.
+void FolderTree::TakeImages() {
+  wxVector<wxBitmapBundle> images;
+  for (const char* symbol : {"folder", "home", "favourite", "volume"}) images.push_back(Symbol(symbol));
+  SetImages(images);
+}
+
+// --- places at the top ---
+
+std::vector<FolderTree::Place> FolderTree::Places() const {
+  std::vector<Place> places;
+  for (const std::string& folder : favourites_.Folders()) {
+    const std::string_view name = platform::FileNameOf(folder);
+    places.push_back({kFavouriteImage, Shown(name.empty() ? folder : name), folder});
+  }
+  const std::string home = platform::SpecialFolderPath(platform::SpecialFolder::Home);
+  const std::string pictures = platform::SpecialFolderPath(platform::SpecialFolder::Pictures);
+  if (!home.empty()) places.push_back({kHomeImage, "Home", home});
+  if (!pictures.empty() && pictures != home) places.push_back({kFolderImage, "Pictures", pictures});
+  for (const std::string& folder : platform::UserVolumes()) {
+    places.push_back({kVolumeImage, Shown(platform::FileNameOf(folder)), folder});
+  }
+  places.push_back({kFolderImage, "File system", std::string(1, platform::kSeparator)});
+  return places;
+}
+
+void FolderTree::UpdatePlaces() {
+  following_ = true;
+  const std::vector<Place> places = Places();
+  const auto shows = [this](const wxTreeItemId& item, const Place& place) {
+    return FolderOf(item) == place.folder && GetItemImage(item) == place.image;
+  };
+  for (const wxTreeItemId& item : ChildrenOf(GetRootItem())) {
+    if (std::ranges::none_of(places, [&](const Place& place) { return shows(item, place); })) Delete(item);
+  }
+  size_t at = 0;
+  for (const wxTreeItemId& item : ChildrenOf(GetRootItem())) {
+    for (; at < places.size() && !shows(item, places[at]); ++at) {
+      const wxTreeItemId added =
+          InsertItem(GetRootItem(), at, places[at].label, places[at].image, -1, new FolderData(places[at].folder));
+      SetItemHasChildren(added);
+    }
+    ++at;
+  }
+  for (; at < places.size(); ++at) {
+    SetItemHasChildren(AppendItem(GetRootItem(), places[at].label, places[at].image, -1, new FolderData(places[at].folder)));
+  }
+  following_ = false;
+}
+
+std::vector<wxTreeItemId> FolderTree::ChildrenOf(const wxTreeItemId& item) const {
+  std::vector<wxTreeItemId> children;
+  wxTreeItemIdValue cookie;
+  for (wxTreeItemId child = GetFirstChild(item, cookie); child.IsOk(); child = GetNextChild(item, cookie))
+    children.push_back(child);
+  return children;
+}
+
+std::string FolderTree::FolderOf(const wxTreeItemId& item) const {
+  const auto* data = item.IsOk() ? static_cast<FolderData*>(GetItemData(item)) : nullptr;
+  return data == nullptr ? std::string() : data->folder;
+}
+
+std::string FolderTree::FolderAt(const wxPoint& point) const {
+  int flags = 0;
+  return FolderOf(const_cast<FolderTree*>(this)->HitTest(point, flags));
+}
+
+// --- reading ---
+
+void FolderTree::Fill(const wxTreeItemId& item) {
+  auto* data = static_cast<FolderData*>(GetItemData(item));
+  if (data == nullptr || data->filled) return;
+  data->filled = true;
+  Read({data->folder});
+}
+
+void FolderTree::Reread() {
+  std::set<std::string> open;
+  const std::function<void(const wxTreeItemId&)> gather = [&](const wxTreeItemId& item) {
+    for (const wxTreeItemId& child : ChildrenOf(item)) {
+      if (static_cast<FolderData*>(GetItemData(child))->filled) open.insert(FolderOf(child));
+      gather(child);
+    }
+  };
+  gather(GetRootItem());
+  Read({open.begin(), open.end()});
+}
+
+void FolderTree::Read(std::vector<std::string> folders) {
+  std::thread([this, alive = std::weak_ptr(alive_), folders = std::move(folders)] {
+    for (const std::string& folder : folders) {
+      if (alive.expired()) return;
+      wxTheApp->CallAfter([this, alive, folder, names = SubfolderNames(folder)] {
+        if (!alive.expired()) TakeNames(folder, names);
+      });
+    }
+  }).detach();
+}
+
+void FolderTree::TakeNames(const std::string& folder, const std::vector<std::string>& names) {
+  // A folder may hang in the tree more than once: under a place of its own and under the file system.
+  for (const wxTreeItemId& place : ChildrenOf(GetRootItem())) {
+    wxTreeItemId item = place;
+    while (item.IsOk() && FolderOf(item) != folder) item = FindChild(item, folder);
+    if (item.IsOk() && static_cast<FolderData*>(GetItemData(item))->filled) MergeNames(item, folder, names);
+  }
+  opening_.erase(folder);
+  FollowOn();
+}
+
+// Folders that are still there stay as they are, open or not.
+void FolderTree::MergeNames(const wxTreeItemId& item, const std::string& folder, const std::vector<std::string>& names) {
+  following_ = true;
+  const std::set<std::string> there(names.begin(), names.end());
+  for (const wxTreeItemId& child : ChildrenOf(item)) {
+    if (!there.contains(std::string(platform::FileNameOf(FolderOf(child))))) Delete(child);
+  }
+  std::set<std::string> shown;
+  for (const wxTreeItemId& child : ChildrenOf(item)) shown.insert(FolderOf(child));
+  for (size_t at = 0; at < names.size(); ++at) {
+    std::string path = platform::JoinFolder(folder, names[at]);
+    if (shown.contains(path)) continue;
+    SetItemHasChildren(InsertItem(item, at, Shown(names[at]), kFolderImage, -1, new FolderData(std::move(path))));
+  }
+  SetItemHasChildren(item, !names.empty());
+  if (opening_.contains(folder) && !names.empty()) Expand(item);
+  following_ = false;
+}
+
+// --- following the browser ---
+
+wxTreeItemId FolderTree::FindChild(const wxTreeItemId& item, const std::string& folder) const {
+  for (const wxTreeItemId& child : ChildrenOf(item)) {
+    if (LiesIn(folder, FolderOf(child))) return child;
+  }
+  return {};
+}
+
+wxTreeItemId FolderTree::NearestItem(const std::string& folder) const {
+  wxTreeItemId item;
+  for (const wxTreeItemId& place : ChildrenOf(GetRootItem())) {
+    if (LiesIn(folder, FolderOf(place)) && (!item.IsOk() || FolderOf(place).size() > FolderOf(item).size())) item = place;
+  }
+  while (item.IsOk() && FolderOf(item) != folder) {
+    const wxTreeItemId child = FindChild(item, folder);
+    if (!child.IsOk()) break;
+    item = child;
+  }
+  return item;
+}
+
+void FolderTree::Follow(const std::string& folder) {
+  if (followed_ == folder) return;
+  followed_ = folder;
+  FollowOn();
+}
+
+void FolderTree::FollowOn() {
+  if (FolderOf(GetSelection()) == followed_) return;
+  const wxTreeItemId item = NearestItem(followed_);
+  if (!item.IsOk()) return;
+  following_ = true;
+  if (FolderOf(item) == followed_) {
+    SelectItem(item);
+    EnsureVisible(item);
+  } else {
+    Fill(item);
+  }
+  following_ = false;
+}
+
+// --- what can be done with a folder ---
+
+void FolderTree::ShowMenu(const wxTreeItemId& item, const wxPoint& point) {
+  const std::string folder = FolderOf(item);
+  if (folder.empty()) return;
+  const bool named = !platform::FileNameOf(folder).empty();
+  wxMenu menu;
+  const int open = menu.Append(wxID_ANY, "&Open")->GetId();
+  const int openInTab = menu.Append(wxID_ANY, "Open in new &tab")->GetId();
+  menu.AppendSeparator();
+  const int newFolder = menu.Append(wxID_ANY, "&New folder...")->GetId();
+  wxMenuItem* const rename = menu.Append(wxID_ANY, "&Rename...");
+  rename->Enable(named);
+  menu.AppendSeparator();
+  const int toggle = menu.Append(wxID_ANY, favourites_.Has(folder) ? "Remove from &favourites" : "Add to &favourites")->GetId();
+  LogEvent("tree-menu", folder);
+  const int chosen = GetPopupMenuSelectionFromUser(menu, point);
+  if (chosen == open) events_.chosen(folder);
+  if (chosen == openInTab) events_.openInTab(folder);
+  if (chosen == newFolder) events_.newFolder(folder);
+  if (chosen == rename->GetId()) AskForName(folder);
+  if (chosen == toggle) events_.toggleFavourite(folder);
+}
+
+void FolderTree::AskForName(const std::string& folder) {
+  const std::string name(platform::FileNameOf(folder));
+  wxTextEntryDialog dialog(this, "New name:", "Rename", Shown(name));
+  if (dialog.ShowModal() != wxID_OK) return;
+  const std::string typed = Utf8(dialog.GetValue());
+  if (!typed.empty() && typed != name) events_.rename(folder, typed);
+}
+
+}  // namespace fotomill::desktop

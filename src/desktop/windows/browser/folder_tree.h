@@ -1,0 +1,65 @@
+#pragma once
+
+#include <wx/treectrl.h>
+
+#include <functional>
+#include <memory>
+#include <set>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "desktop/models/browser/favourites.h"
+
+namespace fotomill::desktop {
+
+// The folders at the left of the frame: the user's favourites, home, pictures, mounted volumes and the root of the file system.
+// Folders are read when they open, on a thread of their own.
+class FolderTree : public wxTreeCtrl {
+ public:
+  struct Events {
+    std::function<void(const std::string& folder)> chosen;
+    std::function<void(const std::string& folder)> openInTab;
+    std::function<void(const std::string& folder)> newFolder;  // in that one
+    std::function<void(const std::string& folder, const std::string& name)> rename;
+    std::function<void(const std::string& folder)> toggleFavourite;
+  };
+  // The favourites are the frame's; they outlive the tree.
+  FolderTree(wxWindow* parent, const Favourites& favourites, Events events);
+
+  // Shows the favourites and the volumes as they are now.
+  void UpdatePlaces();
+  // Reads the folders that are open again.
+  void Reread();
+  // Opens the way to a folder and marks it, without telling `chosen`.
+  void Follow(const std::string& folder);
+  // The folder of an item; empty for none.
+  std::string FolderOf(const wxTreeItemId& item) const;
+  std::string FolderAt(const wxPoint& point) const;
+
+ private:
+  void TakeImages();
+  struct Place;
+  std::vector<Place> Places() const;
+  std::vector<wxTreeItemId> ChildrenOf(const wxTreeItemId& item) const;
+  void Fill(const wxTreeItemId& item);
+  void Read(std::vector<std::string> folders);
+  void TakeNames(const std::string& folder, const std::vector<std::string>& names);
+  void MergeNames(const wxTreeItemId& item, const std::string& folder, const std::vector<std::string>& names);
+  // Goes on along the way to the followed folder as far as folders have been read.
+  void FollowOn();
+  wxTreeItemId FindChild(const wxTreeItemId& item, const std::string& folder) const;
+  // The place at the top from which the way to a folder goes, and the item furthest along it that is there.
+  wxTreeItemId NearestItem(const std::string& folder) const;
+  void ShowMenu(const wxTreeItemId& item, const wxPoint& point);
+  void AskForName(const std::string& folder);
+
+  const Favourites& favourites_;
+  const Events events_;
+  std::string followed_;
+  std::set<std::string> opening_;                                     // folders that open once they have been read
+  bool following_ = false;                                            // what is marked was not chosen by the user
+  const std::shared_ptr<bool> alive_ = std::make_shared<bool>(true);  // for threads that outlive the window
+};
+
+}  // namespace fotomill::desktop

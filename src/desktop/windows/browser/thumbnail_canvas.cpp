@@ -1,0 +1,422 @@
+#include "desktop/windows/browser/thumbnail_canvas.h"
+
+#include <wx/settings.h>
+#include <wx/textctrl.h>
+
+#include <algorithm>
+#include <cmath>
+#include <unordered_set>
+
+#include "core/choice_lists.h"
+#include "desktop/models/browser/event_log.h"
+#include "desktop/windows/shell/looks.h"
+#include "desktop/windows/shell/screen_reader.h"
+#include "desktop/windows/shell/wx_text.h"
+#include "platform/clock.h"
+#include "platform/paths.h"
+#include "settings/settings.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+constexpr int kListWidth = 240;       // of a line in the list of names
+constexpr double kTypingPause = 1.0;  // seconds after which typing begins anew
+constexpr size_t kPrecache = 256;     // thumbnails wanted beyond what is near
+
+bool OpensMenu(const wxKeyEvent& event) {
+  const int key = event.GetKeyCode();
+  return key == WXK_WINDOWS_MENU || key == WXK_MENU || (key == WXK_F10 && event.ShiftDown());
+}
+
+}  // namespace
+
+ThumbnailCanvas::ThumbnailCanvas(wxWindow* parent, BrowserModel& model, ThumbnailService& thumbnails, Events events)
+    : model_(model), thumbnails_(thumbnails), events_(std::move(events)), bandTimer_(this), tip_(*this) {
+  SetBackgroundStyle(wxBG_STYLE_PAINT);
+  Create(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxVSCROLL | wxWANTS_CHARS | wxBORDER_NONE, "Thumbnails");
+  SetLabel("Files of the folder");
+  Bind(wxEVT_PAINT, &ThumbnailCanvas::OnPaint, this);
+  Bind(wxEVT_SIZE, &ThumbnailCanvas::OnSize, this);
+  for (const auto& type :
+       {wxEVT_SCROLLWIN_TOP, wxEVT_SCROLLWIN_BOTTOM, wxEVT_SCROLLWIN_LINEUP, wxEVT_SCROLLWIN_LINEDOWN, wxEVT_SCROLLWIN_PAGEUP,
+        wxEVT_SCROLLWIN_PAGEDOWN, wxEVT_SCROLLWIN_THUMBTRACK, wxEVT_SCROLLWIN_THUMBRELEASE}) {
+    Bind(type, &ThumbnailCanvas::OnScroll, this);
+  }
+  Bind(wxEVT_MOUSEWHEEL, &ThumbnailCanvas::OnWheel, this);
+  Bind(wxEVT_LEFT_DOWN, &ThumbnailCanvas::OnMouseDown, this);
+  Bind(wxEVT_LEFT_UP, &ThumbnailCanvas::OnMouseUp, this);
+  Bind(wxEVT_MOTION, &ThumbnailCanvas::OnMouseMove, this);
+  Bind(wxEVT_LEAVE_WINDOW, [this](wxMouseEvent& event) { UpdateTip(kNoLine), event.Skip(); });
+  Bind(wxEVT_LEFT_DCLICK, &ThumbnailCanvas::OnDoubleClick, this);
+  Bind(wxEVT_RIGHT_DOWN, &ThumbnailCanvas::OnRightDown, this);
+  Bind(wxEVT_KEY_DOWN, &ThumbnailCanvas::OnKey, this);
+  Bind(wxEVT_CHAR, &ThumbnailCanvas::OnChar, this);
+  Bind(wxEVT_MOUSE_CAPTURE_LOST, [this](wxMouseCaptureLostEvent&) {
+    pressed_.reset();
+    banding_ = false;
+  });
+  Bind(wxEVT_SET_FOCUS, [this](wxFocusEvent& event) { Refresh(), event.Skip(); });
+  Bind(wxEVT_KILL_FOCUS, [this](wxFocusEvent& event) { Refresh(), event.Skip(); });
+  Bind(wxEVT_SYS_COLOUR_CHANGED, [this](wxSysColourChangedEvent& event) { Refresh(), event.Skip(); });
+  Bind(wxEVT_DPI_CHANGED, [this](wxDPIChangedEvent& event) { ModelChanged(), event.Skip(); });
+  // While the rubber band is held beyond the edge the list goes on scrolling.
+  Bind(wxEVT_TIMER, [this](wxTimerEvent&) {
+    const wxPoint mouse = ScreenToClient(wxGetMousePosition());
+    const int beyond = mouse.y < 0 ? mouse.y : std::max(mouse.y - GetClientSize().y, 0);
+    if (banding_ && beyond != 0) ScrollTo(scroll_ + beyond);
+  });
+  MeasureCells();
+}
+
+bool ThumbnailCanvas::ListsNames() const { return model_.Modes().view == choice::kViewList; }
+
+void ThumbnailCanvas::MeasureCells() {
+  SetFont(wxSystemSettings::GetFont(wxSYS_DEFAULT_GUI_FONT));
+  textHeight_ = GetCharHeight();
+  const int padding = FromDIP(kPadding);
+  if (ListsNames()) {
+    square_ = 0;
+    layout_.SetCells(TextWidth(*this, kListWidth), textHeight_ + padding, FromDIP(2));
+  } else {
+    square_ = FromDIP(model_.Modes().view == choice::kViewSmall ? 48 : model_.Modes().view == choice::kViewLarge ? 176 : 96);
+    const int width = std::max(square_ + 4 * padding, TextWidth(*this, 96));
+    layout_.SetCells(width, square_ + textHeight_ + 3 * padding, FromDIP(4));
+  }
+  layout_.SetCount(model_.LineCount());
+  layout_.SetWindow(GetClientSize().x, GetClientSize().y);
+}
+
+void ThumbnailCanvas::ModelChanged() {
+  FinishEdit(false);
+  MeasureCells();
+  scroll_ = std::clamp<int64_t>(scroll_, 0, layout_.LargestScroll());
+  UpdateScrollbar();
+  WantThumbnails();
+  TellFocus();
+  Refresh();
+}
+
+void ThumbnailCanvas::UpdateScrollbar() {
+  SetScrollbar(wxVERTICAL, static_cast<int>(scroll_), GetClientSize().y, static_cast<int>(layout_.TotalHeight()));
+}
+
+ThumbnailWish ThumbnailCanvas::WishOf(size_t line) const {
+  const FolderItem& item = model_.Line(line);
+  ThumbnailWish wish;
+  wish.path = model_.PathOfLine(line);
+  wish.modified = item.modified;
+  wish.size = item.size;
+  wish.side = static_cast<int32_t>(std::lround(square_ * GetContentScaleFactor()));
+  wish.mode = model_.Modes().thumbnails;
+  return wish;
+}
+
+// Stand-ins for what is visible first, then the thumbnails themselves, then a screen ahead in the direction of scrolling, then
+// the rest from there on, if it is to be made before anybody looks at it.
+void ThumbnailCanvas::WantThumbnails() {
+  std::vector<ThumbnailWish> wishes;
+  const auto want = [&](size_t first, size_t end) {
+    for (size_t line = first; line < end; ++line) {
+      const FolderItem& item = model_.Line(line);
+      if (item.folder || item.modified == 0) continue;  // its time is not known yet
+      ThumbnailWish wish = WishOf(line);
+      if (thumbnails_.Find(wish) == nullptr) wishes.push_back(std::move(wish));
+    }
+  };
+  if (square_ > 0 && model_.LineCount() > 0) {
+    const int height = GetClientSize().y;
+    const CellLayout::Range visible = layout_.Visible(scroll_);
+    want(visible.first, visible.end);
+    const std::vector<ThumbnailWish> standIns = StandInsFor(visible);
+    const int64_t ahead = direction_ > 0 ? scroll_ + height : std::max<int64_t>(scroll_ - height, 0);
+    const CellLayout::Range next = layout_.LinesBetween(ahead, ahead + height);
+    if (direction_ > 0) want(std::max(next.first, visible.end), next.end);
+    if (direction_ < 0) want(next.first, std::min(next.end, visible.first));
+    if (settings.BrowserThumbnailPrecacheEnable != 0) {
+      for (size_t line = visible.end; line < model_.LineCount() && wishes.size() < kPrecache; ++line) want(line, line + 1);
+    }
+    wishes.insert(wishes.begin(), standIns.begin(), standIns.end());
+  }
+  thumbnails_.Want(std::move(wishes));
+}
+
+std::vector<ThumbnailWish> ThumbnailCanvas::StandInsFor(const CellLayout::Range& lines) const {
+  std::vector<ThumbnailWish> standIns;
+  for (size_t line = lines.first; line < lines.end; ++line) {
+    const FolderItem& item = model_.Line(line);
+    if (item.folder || item.modified == 0 || !MayHoldThumbnail(item.format)) continue;
+    if (thumbnails_.FindAny(model_.PathOfLine(line)) != nullptr) continue;
+    standIns.push_back(WishOf(line));
+    standIns.back().standIn = true;
+  }
+  return standIns;
+}
+
+void ThumbnailCanvas::ThumbnailsCame(const std::vector<ThumbnailLoader::Result>& results) {
+  std::unordered_set<std::string> visible;
+  const CellLayout::Range range = layout_.Visible(scroll_);
+  size_t empty = 0;
+  for (size_t line = range.first; line < range.end; ++line) {
+    visible.insert(model_.PathOfLine(line));
+    if (!model_.Line(line).folder && thumbnails_.FindAny(model_.PathOfLine(line)) == nullptr) ++empty;
+  }
+  const auto shows = [&](const ThumbnailLoader::Result& result) { return visible.contains(result.wish.path); };
+  if (std::any_of(results.begin(), results.end(), shows)) Refresh();
+  if (empty == 0 && filled_ != model_.Folder()) LogEvent("filled", std::to_string(visible.size()));
+  if (empty == 0) filled_ = model_.Folder();
+  if (thumbnails_.Pending() == 0) WantThumbnails();
+}
+
+size_t ThumbnailCanvas::MissingThumbnails() {
+  size_t missing = 0;
+  const CellLayout::Range visible = layout_.Visible(scroll_);
+  for (size_t line = visible.first; line < visible.end && square_ > 0; ++line) {
+    if (!model_.Line(line).folder && thumbnails_.Find(WishOf(line)) == nullptr) ++missing;
+  }
+  return missing;
+}
+
+void ThumbnailCanvas::ShowLine(size_t line) {
+  if (line != kNoLine) ScrollTo(layout_.ScrollToShow(line, scroll_));
+}
+
+void ThumbnailCanvas::ScrollTo(int64_t scroll) {
+  scroll = std::clamp<int64_t>(scroll, 0, layout_.LargestScroll());
+  if (scroll == scroll_) return;
+  FinishEdit(true);
+  direction_ = scroll > scroll_ ? 1 : -1;
+  scroll_ = scroll;
+  UpdateScrollbar();
+  WantThumbnails();
+  Refresh();
+}
+
+// --- scrolling ---
+
+void ThumbnailCanvas::OnSize(wxSizeEvent& event) {
+  layout_.SetWindow(GetClientSize().x, GetClientSize().y);
+  scroll_ = std::clamp<int64_t>(scroll_, 0, layout_.LargestScroll());
+  UpdateScrollbar();
+  WantThumbnails();
+  Refresh();
+  event.Skip();
+}
+
+void ThumbnailCanvas::OnScroll(wxScrollWinEvent& event) {
+  const wxEventType type = event.GetEventType();
+  const int64_t page = std::max(GetClientSize().y - layout_.RowHeight(), layout_.RowHeight());
+  int64_t target = event.GetPosition();
+  if (type == wxEVT_SCROLLWIN_TOP) target = 0;
+  if (type == wxEVT_SCROLLWIN_BOTTOM) target = layout_.LargestScroll();
+  if (type == wxEVT_SCROLLWIN_LINEUP) target = scroll_ - layout_.RowHeight();
+  if (type == wxEVT_SCROLLWIN_LINEDOWN) target = scroll_ + layout_.RowHeight();
+  if (type == wxEVT_SCROLLWIN_PAGEUP) target = scroll_ - page;
+  if (type == wxEVT_SCROLLWIN_PAGEDOWN) target = scroll_ + page;
+  ScrollTo(target);
+}
+
+void ThumbnailCanvas::OnWheel(wxMouseEvent& event) {
+  if (event.GetWheelAxis() != wxMOUSE_WHEEL_VERTICAL || event.GetWheelDelta() == 0) return event.Skip();
+  const double notches = static_cast<double>(event.GetWheelRotation()) / event.GetWheelDelta();
+  if (event.ControlDown()) {
+    if (events_.resize && notches != 0) events_.resize(notches > 0 ? 1 : -1);
+    return;
+  }
+  const double step = ListsNames() ? 3.0 * layout_.RowHeight() : std::max(layout_.RowHeight() / 2.0, FromDIP(60) * 1.0);
+  ScrollTo(scroll_ - std::lround(notches * step));
+}
+
+// --- mouse ---
+
+size_t ThumbnailCanvas::LineAt(const wxPoint& point) const { return layout_.LineAt(point.x, point.y + scroll_); }
+
+// Screen readers know the canvas by the file with the focus, and say it again when that changes.
+void ThumbnailCanvas::TellFocus() {
+  const wxString focus = Shown(model_.FocusText());
+  const wxString count = Shown(std::to_string(model_.Selected().SelectedCount()) + " selected");
+  TellScreenReader(*this, focus.empty() ? wxString("Thumbnails") : focus, "Thumbnails, " + count);
+}
+
+void ThumbnailCanvas::TellSelection() {
+  Refresh();
+  TellFocus();
+  if (events_.selectionChanged) events_.selectionChanged();
+}
+
+void ThumbnailCanvas::OnMouseDown(wxMouseEvent& event) {
+  FinishEdit(true);
+  SetFocus();
+  const size_t line = LineAt(event.GetPosition());
+  pressed_ = wxPoint(event.GetX(), static_cast<int>(event.GetY() + scroll_));
+  pressedLine_ = line;
+  if (!HasCapture()) CaptureMouse();
+  Selection& selection = model_.Selected();
+  if (line == kNoLine) {
+    const bool keep = event.ControlDown() || event.ShiftDown();
+    if (!keep) selection.ClickBlank(settings.ClearAllOnBlankClick != 0);
+    return TellSelection();
+  }
+  // A press on a selected line may begin a drag of all; what a plain click does is done when the button goes up.
+  if (selection.IsSelected(line) && !event.ControlDown() && !event.ShiftDown()) return;
+  selection.Click(line, event.ShiftDown(), event.ControlDown());
+  TellSelection();
+}
+
+void ThumbnailCanvas::OnMouseUp(wxMouseEvent& event) {
+  if (HasCapture()) ReleaseMouse();
+  bandTimer_.Stop();
+  const bool click = pressed_ && !banding_ && pressedLine_ != kNoLine && !event.ControlDown() && !event.ShiftDown();
+  if (click && LineAt(event.GetPosition()) == pressedLine_) {
+    model_.Selected().Click(pressedLine_, false, false);
+    TellSelection();
+  }
+  pressed_.reset();
+  banding_ = false;
+  Refresh();
+}
+
+void ThumbnailCanvas::OnMouseMove(wxMouseEvent& event) {
+  if (!pressed_ || !event.LeftIsDown()) return UpdateTip(LineAt(event.GetPosition()));
+  const wxPoint now(event.GetX(), static_cast<int>(event.GetY() + scroll_));
+  const wxPoint way = now - *pressed_;
+  if (!banding_ && std::abs(way.x) + std::abs(way.y) < FromDIP(6)) return;
+  if (pressedLine_ != kNoLine) {
+    if (HasCapture()) ReleaseMouse();
+    pressed_.reset();
+    if (events_.dragBegins) events_.dragBegins();
+    return;
+  }
+  Selection& selection = model_.Selected();
+  if (!banding_) {
+    selection.BeginBand(event.ControlDown() || event.ShiftDown());
+    banding_ = true;
+    bandTimer_.Start(40);
+  }
+  bandEnd_ = now;
+  const Rect band{std::min(pressed_->x, now.x), std::min(pressed_->y, now.y), std::abs(way.x) + 1, std::abs(way.y) + 1};
+  selection.MoveBand(layout_.LinesIn(band));
+  TellSelection();
+}
+
+void ThumbnailCanvas::OnDoubleClick(wxMouseEvent& event) {
+  const size_t line = LineAt(event.GetPosition());
+  if (line != kNoLine && events_.activated) events_.activated(line);
+}
+
+void ThumbnailCanvas::OnRightDown(wxMouseEvent& event) {
+  FinishEdit(true);
+  SetFocus();
+  const size_t line = LineAt(event.GetPosition());
+  model_.Selected().ContextClick(line);
+  if (line == kNoLine) model_.Selected().ClickBlank(settings.ClearAllOnBlankClick != 0);
+  TellSelection();
+  if (events_.contextMenu) events_.contextMenu(line, event.GetPosition());
+}
+
+void ThumbnailCanvas::UpdateTip(size_t line) {
+  if (line >= model_.LineCount()) return tip_.Over(model_.Folder(), nullptr, Status::Ok);
+  const ThumbnailPointer thumbnail = thumbnails_.FindAny(model_.PathOfLine(line));
+  tip_.Over(model_.Folder(), &model_.Line(line), thumbnail == nullptr ? Status::Ok : thumbnail->status);
+}
+
+// --- keyboard ---
+
+void ThumbnailCanvas::MoveFocus(Step step, const wxKeyEvent& event) {
+  const size_t line = layout_.Move(model_.Selected().Focus(), step);
+  if (line == kNoLine) return;
+  model_.Selected().MoveFocus(line, event.ShiftDown(), event.ControlDown());
+  ShowLine(line);
+  TellSelection();
+}
+
+void ThumbnailCanvas::OnKey(wxKeyEvent& event) {
+  struct KeyStep {
+    int key;
+    Step step;
+  };
+  constexpr KeyStep kSteps[] = {
+      {WXK_LEFT, Step::Left},  {WXK_RIGHT, Step::Right}, {WXK_UP, Step::Up},         {WXK_DOWN, Step::Down},
+      {WXK_HOME, Step::First}, {WXK_END, Step::Last},    {WXK_PAGEUP, Step::PageUp}, {WXK_PAGEDOWN, Step::PageDown},
+  };
+  if (event.AltDown()) return event.Skip();
+  if (event.GetKeyCode() == WXK_TAB && !event.ControlDown()) {
+    Navigate(event.ShiftDown() ? wxNavigationKeyEvent::IsBackward : wxNavigationKeyEvent::IsForward);
+    return;
+  }
+  for (const KeyStep& row : kSteps) {
+    if (row.key == event.GetKeyCode()) return MoveFocus(row.step, event);
+  }
+  const size_t focus = model_.Selected().Focus();
+  if (OpensMenu(event) && focus != kNoLine && events_.contextMenu) {
+    const Rect cell = layout_.Cell(focus);
+    return events_.contextMenu(focus, wxPoint(cell.x + cell.width / 2, static_cast<int>(cell.y - scroll_) + cell.height / 2));
+  }
+  const bool enter = event.GetKeyCode() == WXK_RETURN || event.GetKeyCode() == WXK_NUMPAD_ENTER;
+  if (enter && !event.HasAnyModifiers() && focus != kNoLine) return events_.activated(focus);
+  if (event.GetKeyCode() == WXK_SPACE && typed_.empty()) {
+    model_.Selected().ToggleFocus();
+    return TellSelection();
+  }
+  event.Skip();
+}
+
+// Letters jump to the next name that begins with what was typed.
+void ThumbnailCanvas::OnChar(wxKeyEvent& event) {
+  const wxChar key = event.GetUnicodeKey();
+  if (key < 0x20 || key == 0x7f || event.HasModifiers()) return event.Skip();
+  const double now = platform::MonotonicSeconds();
+  if (now - typedAt_ > kTypingPause) typed_.clear();
+  typedAt_ = now;
+  const std::string letter = Utf8(wxString(key));
+  const bool again = typed_ == letter;
+  if (!again) typed_ += letter;
+  const size_t line = model_.FindTyped(typed_, typed_ == letter);
+  if (line == kNoLine) return;
+  model_.Selected().MoveFocus(line, false, false);
+  ShowLine(line);
+  TellSelection();
+}
+
+// --- renaming in place ---
+
+void ThumbnailCanvas::EditName(size_t line) {
+  FinishEdit(true);
+  if (line >= model_.LineCount()) return;
+  ShowLine(line);
+  const Rect cell = layout_.Cell(line);
+  const std::string& name = model_.Line(line).name;
+  const int height = textHeight_ + FromDIP(12);
+  const int top = static_cast<int>(cell.y - scroll_) + cell.height - height;
+  editedLine_ = line;
+  editor_ = new wxTextCtrl(this, wxID_ANY, Shown(name), wxPoint(cell.x, top), wxSize(std::max(cell.width, FromDIP(160)), height),
+                           wxTE_PROCESS_ENTER, wxDefaultValidator, "New name");
+  editor_->Bind(wxEVT_TEXT_ENTER, [this](wxCommandEvent&) { CallAfter([this] { FinishEdit(true); }); });
+  editor_->Bind(wxEVT_KILL_FOCUS, [this](wxFocusEvent& event) {
+    CallAfter([this] { FinishEdit(true); });
+    event.Skip();
+  });
+  editor_->Bind(wxEVT_KEY_DOWN, [this](wxKeyEvent& event) {
+    if (event.GetKeyCode() != WXK_ESCAPE) return event.Skip();
+    CallAfter([this] { FinishEdit(false); });
+  });
+  editor_->SetFocus();
+  const size_t base = model_.Line(line).folder ? name.size() : name.size() - platform::SplitPath(name).extension.size();
+  editor_->SetSelection(0, static_cast<long>(Shown(std::string_view(name).substr(0, base)).length()));
+}
+
+void ThumbnailCanvas::FinishEdit(bool accept) {
+  if (editor_ == nullptr) return;
+  wxTextCtrl* editor = std::exchange(editor_, nullptr);
+  const size_t line = std::exchange(editedLine_, kNoLine);
+  const std::string name = Utf8(editor->GetValue());
+  const bool hadFocus = editor->HasFocus();
+  const bool changed = line < model_.LineCount() && editor->IsModified() && name != model_.Line(line).name;
+  editor->Hide();
+  editor->Destroy();
+  if (hadFocus) SetFocus();
+  Refresh();
+  if (accept && changed && !name.empty() && events_.renamed) events_.renamed(line, name);
+}
+
+}  // namespace fotomill::desktop

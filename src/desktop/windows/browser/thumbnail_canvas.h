@@ -1,0 +1,113 @@
+#pragma once
+
+#include <wx/timer.h>
+#include <wx/window.h>
+
+#include <functional>
+#include <optional>
+#include <string>
+#include <unordered_map>
+
+#include "desktop/models/browser/browser_model.h"
+#include "desktop/models/browser/cell_layout.h"
+#include "desktop/windows/browser/hover_tip.h"
+#include "desktop/windows/browser/thumbnail_service.h"
+
+class wxDC;
+class wxTextCtrl;
+
+namespace fotomill::desktop {
+
+// The thumbnail list of a browser: one window that draws the cells that are visible, whatever the number of files.
+class ThumbnailCanvas : public wxWindow {
+ public:
+  // What it tells the browser.
+  struct Events {
+    std::function<void()> selectionChanged;
+    std::function<void(size_t line)> activated;                    // double click
+    std::function<void(size_t line, const wxPoint&)> contextMenu;  // kNoLine: on empty space; where in the canvas
+    std::function<void()> dragBegins;
+    std::function<void(int steps)> resize;  // Ctrl and the wheel
+    std::function<void(size_t line, const std::string& name)> renamed;
+  };
+
+  ThumbnailCanvas(wxWindow* parent, BrowserModel& model, ThumbnailService& thumbnails, Events events);
+
+  // The model has other lines, or another view mode.
+  void ModelChanged();
+  void ThumbnailsCame(const std::vector<ThumbnailLoader::Result>& results);
+  // Asks for what is visible, then for what is near. To be called when this browser comes to the front.
+  void WantThumbnails();
+  void ShowLine(size_t line);
+  int64_t Scroll() const { return scroll_; }
+  void ScrollTo(int64_t scroll);
+  // Lets the user type another name for a line, in its place.
+  void EditName(size_t line);
+  // Visible thumbnails that are not there yet.
+  size_t MissingThumbnails();
+  bool ListsNames() const;
+
+ private:
+  static constexpr int kPadding = 6;  // inside a cell, device-independent pixels
+  struct Looks;
+  void OnPaint(wxPaintEvent&);
+  void Paint();
+  void OnSize(wxSizeEvent&);
+  void OnScroll(wxScrollWinEvent&);
+  void OnWheel(wxMouseEvent&);
+  void OnMouseDown(wxMouseEvent&);
+  void OnMouseUp(wxMouseEvent&);
+  void OnMouseMove(wxMouseEvent&);
+  void OnDoubleClick(wxMouseEvent&);
+  void OnRightDown(wxMouseEvent&);
+  void OnKey(wxKeyEvent&);
+  void OnChar(wxKeyEvent&);
+
+  void MeasureCells();
+  void DrawCell(wxDC& dc, size_t line, const Looks& looks);
+  void DrawPicture(wxDC& dc, size_t line, const wxRect& square, const Looks& looks);
+  void DrawPlaceholder(wxDC& dc, const FolderItem& item, const wxRect& square, const wxString& mark, const Looks& looks);
+  wxString CutName(wxDC& dc, const std::string& name, int width);
+  const wxBitmap& BitmapOfThumbnail(const ThumbnailPointer& thumbnail);
+  ThumbnailWish WishOf(size_t line) const;
+  std::vector<ThumbnailWish> StandInsFor(const CellLayout::Range& lines) const;
+  size_t LineAt(const wxPoint& point) const;
+  void MoveFocus(Step step, const wxKeyEvent& event);
+  void TellFocus();
+  void TellSelection();
+  void UpdateScrollbar();
+  void UpdateTip(size_t line);
+  void FinishEdit(bool accept);
+
+  BrowserModel& model_;
+  ThumbnailService& thumbnails_;
+  const Events events_;
+  CellLayout layout_;
+  int64_t scroll_ = 0;
+  int direction_ = 1;  // of scrolling: what is ahead is loaded first
+  int square_ = 96;    // the picture's place in a cell, 0 where there is none
+  int textHeight_ = 16;
+  int painted_ = 0;     // 1: anything, 2: files
+  std::string filled_;  // the folder of which every visible cell has shown a picture
+
+  struct Drawn {
+    ThumbnailPointer thumbnail;
+    wxBitmap bitmap;
+  };
+  std::unordered_map<const Thumbnail*, Drawn> bitmaps_;
+  std::unordered_map<std::string, wxString> cutNames_;
+  int cutWidth_ = 0;
+
+  std::optional<wxPoint> pressed_;  // where the left button went down, in the list
+  size_t pressedLine_ = kNoLine;
+  bool banding_ = false;
+  wxPoint bandEnd_;
+  std::string typed_;
+  double typedAt_ = 0;
+  wxTimer bandTimer_;
+  HoverTip tip_;
+  wxTextCtrl* editor_ = nullptr;
+  size_t editedLine_ = kNoLine;
+};
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,39 @@
+#pragma once
+
+#include <wx/event.h>
+
+#include <functional>
+#include <memory>
+#include <vector>
+
+#include "desktop/models/thumbnails/thumbnail_loader.h"
+
+namespace fotomill::desktop {
+
+// The program's thumbnails: one cache and one set of workers for all browsers. Whoever shows thumbnails says what it
+// wants and is told, on the window's thread, when something of it has come.
+class ThumbnailService : public wxEvtHandler {
+ public:
+  using Listener = std::function<void(const std::vector<ThumbnailLoader::Result>&)>;
+
+  ThumbnailService();
+  ~ThumbnailService() override;
+
+  ThumbnailPointer Find(const ThumbnailWish& wish) { return cache_.Find(wish); }
+  ThumbnailPointer FindAny(const std::string& path) const { return cache_.FindAny(path); }
+  // Replaces all wishes; only one browser is in front.
+  void Want(std::vector<ThumbnailWish> wishes) { loader_->Want(std::move(wishes)); }
+  void SetListener(Listener listener) { listener_ = std::move(listener); }
+  void Clear() { cache_.Clear(); }
+  size_t Pending() const { return loader_->Pending(); }
+  uint64_t Bytes() const { return cache_.Bytes(); }
+
+ private:
+  void TakeResults();
+
+  ThumbnailCache cache_;
+  Listener listener_;
+  std::unique_ptr<ThumbnailLoader> loader_;
+};
+
+}  // namespace fotomill::desktop

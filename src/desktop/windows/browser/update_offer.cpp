@@ -1,0 +1,80 @@
+#include "desktop/windows/browser/update_offer.h"
+
+#include <wx/app.h>
+
+#include "desktop/models/browser/event_log.h"
+#include "desktop/windows/browser/update_bar.h"
+
+namespace fotomill::desktop {
+
+UpdateOffer::UpdateOffer(wxWindow* parent, Events events) : events_(std::move(events)) {
+  bar_ = new UpdateBar(parent, [this](int32_t choice) {
+    if (offer_ != nullptr) offer_->Answer(choice);
+    ShowBar(false);
+    events_.answered();
+  });
+  bar_->Hide();
+}
+
+UpdateOffer::~UpdateOffer() {
+  if (offer_ != nullptr) offer_->Stop();
+}
+
+void UpdateOffer::Offer(const std::string& folder, std::vector<std::string> files, const BrowserModes& modes) {
+  if (offered_) return;
+  offered_ = true;
+  ThumbnailBrowser browser;
+  browser.folder = folder;
+  browser.files = std::move(files);
+  browser.mode = static_cast<choice::ThumbnailMode>(modes.thumbnails);
+  browser.view = static_cast<choice::ViewMode>(modes.view);
+  browser.asks = asks_;
+  browser.lastCompaction = lastCompaction_;
+  // What the offer tells of a folder that was left meanwhile is dropped.
+  const auto weak = std::make_shared<std::weak_ptr<ThumbnailOffer>>();
+  const auto post = [weak](std::function<void()> action) {
+    wxTheApp->CallAfter([weak, action = std::move(action)] {
+      if (weak->lock() != nullptr) action();
+    });
+  };
+  ThumbnailOffer::Events events;
+  events.ask = [this, post](int32_t count, int32_t selected) {
+    post([this, count, selected] {
+      bar_->Ask(count, selected);
+      ShowBar(true);
+      LogEvent("offer", std::to_string(count));
+    });
+  };
+  events.building = [this, post](size_t done, size_t total) {
+    post([this, done, total] {
+      bar_->Tell(wxString::Format("Creating thumbnails: %zu of %zu", done, total));
+      ShowBar(done < total);
+    });
+  };
+  events.ended = [this, post](bool changed, const ThumbnailBrowser& after) {
+    post([this, changed, asks = after.asks, compaction = after.lastCompaction] {
+      asks_ = asks;
+      lastCompaction_ = compaction;
+      ShowBar(false);
+      if (changed) events_.made();
+      LogEvent("offer-ended", changed ? "changed" : "unchanged");
+    });
+  };
+  offer_ = ThumbnailOffer::Start(std::move(browser), std::move(events));
+  *weak = offer_;
+}
+
+void UpdateOffer::Forget() {
+  if (offer_ != nullptr) offer_->Stop();
+  offer_.reset();
+  offered_ = false;
+  ShowBar(false);
+}
+
+void UpdateOffer::ShowBar(bool show) {
+  if (bar_->IsShown() == show) return;
+  bar_->Show(show);
+  bar_->GetParent()->Layout();
+}
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,45 @@
+#pragma once
+
+#include <functional>
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "desktop/models/thumbnails/thumbnail_offer.h"
+#include "settings/folder_override.h"
+
+class wxWindow;
+
+namespace fotomill::desktop {
+
+class UpdateBar;
+
+// A browser's offer to make the missing thumbnail files of its folder: the bar above the list, and what goes on behind it.
+class UpdateOffer {
+ public:
+  struct Events {
+    std::function<void()> answered;  // the bar has gone
+    std::function<void()> made;      // there are new thumbnails
+  };
+  UpdateOffer(wxWindow* parent, Events events);
+  ~UpdateOffer();
+
+  // The bar, hidden while there is nothing to ask or tell; its parent lays it out.
+  UpdateBar* Bar() const { return bar_; }
+  // Offers once for a folder with these files.
+  void Offer(const std::string& folder, std::vector<std::string> files, const BrowserModes& modes);
+  // The browser goes to another folder.
+  void Forget();
+
+ private:
+  void ShowBar(bool show);
+
+  const Events events_;
+  UpdateBar* bar_;
+  std::shared_ptr<ThumbnailOffer> offer_;  // of this folder
+  bool offered_ = false;
+  bool asks_ = true;  // until the user wants no more offers here
+  int64_t lastCompaction_ = 0;
+};
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,287 @@
+#include "desktop/windows/compare/compare_frame.h"
+
+#include <wx/panel.h>
+#include <wx/settings.h>
+#include <wx/sizer.h>
+#include <wx/stattext.h>
+
+#include <algorithm>
+#include <cmath>
+#include <limits>
+
+#include "catalog/history/file_history.h"
+#include "desktop/models/browser/event_log.h"
+#include "desktop/windows/shell/file_actions.h"
+#include "desktop/windows/shell/key_commands.h"
+#include "desktop/windows/shell/main_frame.h"
+#include "desktop/windows/shell/screen_reader.h"
+#include "desktop/windows/shell/wx_text.h"
+#include "desktop/windows/view/info_frame.h"
+#include "platform/files.h"
+#include "platform/paths.h"
+#include "settings/configuration.h"
+#include "settings/settings.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+constexpr uint64_t kNoLimit = std::numeric_limits<uint64_t>::max();  // all pictures are on the screen: none can be given back
+constexpr int kAcross = 2;                                           // panes beside each other
+constexpr int kFrameWidth = 3;                                       // around the pane with the focus
+
+template <void (CompareFrame::*action)()>
+void Of(CompareFrame& compare) {
+  (compare.*action)();
+}
+template <void (ViewCanvas::*action)()>
+void OfCanvas(CompareFrame& compare) {
+  (compare.Canvas().*action)();
+}
+template <ZoomMode mode>
+void Zoom(CompareFrame& compare) {
+  compare.Canvas().SetZoom(mode);
+}
+template <int step>
+void StepPane(CompareFrame& compare) {
+  compare.StepPane(step);
+}
+bool AreJoined(const CompareFrame& compare) { return compare.Joined(); }
+template <int32_t Settings::*setting>
+constexpr auto Switch = SwitchSetting<CompareFrame, setting>;
+template <int32_t Settings::*setting>
+constexpr auto IsOn = SettingIsOn<CompareFrame, setting>;
+
+// clang-format off
+constexpr KeyCommand<CompareFrame> kCommands[] = {
+    {"&Next pane",        "Tab",       {WXK_TAB},                       StepPane<1>},
+    {"&Previous pane",    "Shift+Tab", {},                              StepPane<-1>},
+    {"&Join zoom and place", "J",      {'J'},                           Of<&CompareFrame::ToggleJoined>, AreJoined},
+    {nullptr, nullptr, {}, nullptr},
+    {"Zoom &in",          "+",         {'+', '=', WXK_NUMPAD_ADD},      OfCanvas<&ViewCanvas::ZoomIn>},
+    {"Zoom &out",         "-",         {'-', WXK_NUMPAD_SUBTRACT},      OfCanvas<&ViewCanvas::ZoomOut>},
+    {"Fit to &window",    "0",         {'0', WXK_NUMPAD0},              Zoom<ZoomMode::Fit>},
+    {"&Actual size",      "1",         {'1', WXK_NUMPAD1},              OfCanvas<&ViewCanvas::ZoomActual>},
+    {"Fit to wi&dth",     "2",         {'2', WXK_NUMPAD2},              Zoom<ZoomMode::FitWidth>},
+    {"Fi&ll the window",  "3",         {'3', WXK_NUMPAD3},              Zoom<ZoomMode::Fill>},
+    {nullptr, nullptr, {}, nullptr},
+    {"Full &screen",      "F11",       {WXK_F11, 'F'},                  Of<&CompareFrame::ToggleFullScreen>},
+    {"Colors of the pro&file", "M",    {'M'},                           Switch<&Settings::ViewModeColorProfiles>, IsOn<&Settings::ViewModeColorProfiles>},
+    {"Check&erboard behind transparency", "B", {'B'},                   Switch<&Settings::ViewModeCheckerboard>, IsOn<&Settings::ViewModeCheckerboard>},
+    {"&Get info...",      "Alt+Enter", {},                              Of<&CompareFrame::ShowInfoWindow>},
+    {nullptr, nullptr, {}, nullptr},
+    {"Dele&te",           "Del",       {WXK_DELETE},                    Of<&CompareFrame::DeleteFile>},
+    {"&Close",            "Esc",       {WXK_ESCAPE, WXK_RETURN, WXK_NUMPAD_ENTER}, Of<&CompareFrame::Leave>},
+};
+// clang-format on
+
+std::span<const KeyCommand<CompareFrame>> Commands() { return kCommands; }
+
+}  // namespace
+
+CompareFrame::CompareFrame(MainFrame& frame, const std::vector<std::string>& files)
+    : wxFrame(&frame, wxID_ANY, "Compare", wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE,
+              "FotomillProfessionalCompare"),
+      frame_(frame) {
+  SetSize(frame.GetSize());
+  for (const std::string& file : files) panes_.push_back(BuildPane(file));
+  place_ = panes_.front().canvas->Place();
+  loader_ = std::make_unique<ViewLoader>(kNoLimit, [this] { CallAfter([this] { PicturesCame(); }); });
+  CreateStatusBar();
+  ArrangePanes();
+  panes_.front().canvas->SetFocus();
+  if (settings.MaximizeViewWindow != 0) Maximize();
+  WantPictures();
+}
+
+CompareFrame::~CompareFrame() { loader_.reset(); }  // its thread calls back into this window
+
+CompareFrame::Pane CompareFrame::BuildPane(const std::string& path) {
+  auto* panel = new wxPanel(this);
+  Pane pane{path, panel, nullptr,
+            new wxStaticText(panel, wxID_ANY, Shown(platform::FileNameOf(path)), wxDefaultPosition, wxDefaultSize,
+                             wxST_ELLIPSIZE_MIDDLE)};
+  // The events need the canvas that they come from, which is not there yet.
+  const auto self = std::make_shared<ViewCanvas*>(nullptr);
+  pane.canvas = new ViewCanvas(panel, {.resized = [this] { WantPictures(); },
+                                       .changed = [this, self] { ShowFacts(*self); },
+                                       .painted = [] {},
+                                       .placed = [this, self] { Placed(*self); }});
+  ViewCanvas* const canvas = *self = pane.canvas;
+  canvas->Bind(wxEVT_KEY_DOWN, &CompareFrame::OnKey, this);
+  canvas->Bind(wxEVT_SET_FOCUS, [this, canvas](wxFocusEvent& event) {
+    Focused(PaneOf(canvas));
+    event.Skip();
+  });
+  canvas->Bind(wxEVT_RIGHT_DOWN, [this, canvas](wxMouseEvent& event) {
+    canvas->SetFocus();
+    if (settings.RightClickMenuInView != 0) ShowCommandMenu(Commands(), *this, *canvas, event.GetPosition());
+  });
+  auto* rows = new wxBoxSizer(wxVERTICAL);
+  rows->Add(canvas, wxSizerFlags(1).Expand().Border(wxALL, FromDIP(kFrameWidth)));
+  rows->Add(pane.caption, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, FromDIP(kFrameWidth)));
+  panel->SetSizer(rows);
+  return pane;
+}
+
+void CompareFrame::ArrangePanes() {
+  const int count = static_cast<int>(panes_.size());
+  SetSizer(nullptr);  // the old one lets go of its panes
+  auto* grid = new wxGridSizer(std::min(count, kAcross), FromDIP(wxSize(kFrameWidth, kFrameWidth)));
+  for (const Pane& pane : panes_) grid->Add(pane.panel, wxSizerFlags(1).Expand());
+  SetSizer(grid);
+  Layout();
+  SetTitle(wxString::Format(count == 1 ? "Compare - %d picture" : "Compare - %d pictures", count));
+}
+
+size_t CompareFrame::PaneOf(const ViewCanvas* canvas) const {
+  const auto found = std::ranges::find(panes_, canvas, &Pane::canvas);
+  return static_cast<size_t>(found - panes_.begin());
+}
+
+// --- pictures ---
+
+ViewWish CompareFrame::WishOf(const Pane& pane) const {
+  const wxSize size = pane.canvas->DeviceSize();
+  return {pane.path, 0, size.x, size.y};
+}
+
+void CompareFrame::WantPictures() {
+  if (loader_ == nullptr) return;
+  std::vector<ViewWish> wishes;
+  for (const Pane& pane : panes_) wishes.push_back(WishOf(pane));
+  loader_->Want(std::move(wishes));
+}
+
+void CompareFrame::PicturesCame() {
+  for (Pane& pane : panes_) {
+    const ViewPicturePointer ready = loader_->Find(WishOf(pane));
+    if (ready != nullptr && ready != pane.canvas->Picture()) TakePicture(pane, ready);
+  }
+}
+
+void CompareFrame::FilesChanged() {
+  for (const Pane& pane : panes_) {
+    const ViewPicturePointer& shown = pane.canvas->Picture();
+    if (shown != nullptr && shown->HasChanged() && platform::IsRegularFile(pane.path)) loader_->Forget(pane.path);
+  }
+  WantPictures();
+}
+
+void CompareFrame::TakePicture(Pane& pane, ViewPicturePointer picture) {
+  LogEvent("compare", "pane=" + std::to_string(PaneOf(pane.canvas) + 1) + "/" + std::to_string(panes_.size()) +
+                          " status=" + std::to_string(StatusNumber(picture->status)) + " file=" + pane.path);
+  if (picture->picture != nullptr) frame_.NoteUses({FileUse{pane.path, FileFunction::View}});
+  pane.canvas->Show(std::move(picture));
+  if (joined_) pane.canvas->SetPlace(place_);
+}
+
+// --- panes ---
+
+void CompareFrame::Placed(const ViewCanvas* canvas) {
+  if (joined_) {
+    place_ = canvas->Place();
+    for (const Pane& pane : panes_) {
+      if (pane.canvas != canvas) pane.canvas->SetPlace(place_);
+    }
+  }
+  std::string zooms;
+  for (const Pane& pane : panes_) zooms += " " + std::to_string(std::lround(pane.canvas->Zoom() * 100)) + "%";
+  LogEvent("compare-zoom", "joined=" + std::to_string(joined_ ? 1 : 0) + zooms);
+}
+
+void CompareFrame::Focused(size_t pane) {
+  if (pane >= panes_.size()) return;  // while it is being built
+  focus_ = pane;
+  for (const Pane& each : panes_) {
+    const bool own = &each == &panes_[focus_];
+    each.panel->SetBackgroundColour(wxSystemSettings::GetColour(own ? wxSYS_COLOUR_HIGHLIGHT : wxSYS_COLOUR_FRAMEBK));
+    each.caption->SetForegroundColour(wxSystemSettings::GetColour(own ? wxSYS_COLOUR_HIGHLIGHTTEXT : wxSYS_COLOUR_WINDOWTEXT));
+    each.caption->SetFont(own ? GetFont().Bold() : GetFont());
+    each.panel->Refresh();
+  }
+  const std::string place = std::to_string(focus_ + 1) + " of " + std::to_string(panes_.size());
+  SetStatusText(Shown(place + (joined_ ? ", zoomed and moved together" : ", zoomed and moved apart")));
+  LogEvent("compare-focus", std::to_string(focus_ + 1) + "/" + std::to_string(panes_.size()));
+}
+
+void CompareFrame::ShowFacts(const ViewCanvas* canvas) {
+  const size_t place = PaneOf(canvas);
+  if (place >= panes_.size()) return;
+  const Pane& pane = panes_[place];
+  const ViewPicturePointer& shown = canvas->Picture();
+  const std::string facts = shown == nullptr            ? "loading..."
+                            : shown->picture == nullptr ? std::string(StatusMessage(shown->status))
+                                                        : SizeAndZoom(*shown->picture, canvas->Zoom());
+  const wxString name = Shown(platform::FileNameOf(pane.path));
+  pane.caption->SetLabel(name + "   " + Shown(facts));
+  TellScreenReader(*pane.canvas, name, Shown(facts));
+}
+
+// --- commands ---
+
+void CompareFrame::ToggleJoined() {
+  joined_ = !joined_;
+  Focused(focus_);
+  Placed(&Canvas());
+}
+
+void CompareFrame::StepPane(int panes) {
+  const int count = static_cast<int>(panes_.size());
+  panes_[static_cast<size_t>((static_cast<int>(focus_) + panes + count) % count)].canvas->SetFocus();
+}
+
+void CompareFrame::ToggleFullScreen() { ShowFullScreen(!IsFullScreen()); }
+
+void CompareFrame::SettingSwitched() {
+  (void)SaveConfiguration();
+  WantPictures();
+  PicturesCame();
+}
+
+void CompareFrame::ShowInfoWindow() {
+  std::vector<std::string> paths;
+  for (const Pane& pane : panes_) paths.push_back(pane.path);
+  (new InfoFrame(frame_, this, std::move(paths)))->Show();
+}
+
+void CompareFrame::DeleteFile() {
+  const Pane gone = panes_[focus_];
+  if (!frame_.Files().TrashFromView(this, gone.path)) return;
+  loader_->Forget(gone.path);
+  panes_.erase(panes_.begin() + static_cast<std::ptrdiff_t>(focus_));
+  gone.panel->Hide();
+  // This may be one of its own events.
+  CallAfter([panel = gone.panel] { panel->Destroy(); });
+  if (panes_.empty()) {
+    Close();
+    return;
+  }
+  focus_ = std::min(focus_, panes_.size() - 1);
+  ArrangePanes();
+  Canvas().SetFocus();
+  WantPictures();
+}
+
+void CompareFrame::Leave() {
+  if (IsFullScreen()) return ToggleFullScreen();
+  Close();
+}
+
+void CompareFrame::OnKey(wxKeyEvent& event) {
+  const int key = event.GetKeyCode();
+  if (key == WXK_TAB && event.ShiftDown()) return StepPane(-1);
+  if (Canvas().PanByKey(key)) return;
+  if (event.AltDown() && key == WXK_RETURN) return ShowInfoWindow();
+  if (event.AltDown() || event.ControlDown()) return event.Skip();
+  if (const KeyCommand<CompareFrame>* command = CommandOfKey(Commands(), key)) return command->run(*this);
+  event.Skip();
+}
+
+void CompareSelection(MainFrame& frame) {
+  std::vector<std::string> files = frame.SelectedFiles();
+  if (!CompareFrame::Takes(files.size())) return frame.Tell("Two to four files can be compared.");
+  (new CompareFrame(frame, files))->Show();
+}
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,316 @@
+#include "desktop/windows/setup/setup_box.h"
+
+#include <wx/app.h>
+#include <wx/button.h>
+#include <wx/filedlg.h>
+#include <wx/listbox.h>
+#include <wx/msgdlg.h>
+#include <wx/simplebook.h>
+#include <wx/sizer.h>
+#include <wx/srchctrl.h>
+#include <wx/stattext.h>
+#include <wx/utils.h>
+
+#include <algorithm>
+
+#include "core/data_folder.h"
+#include "desktop/models/browser/event_log.h"
+#include "desktop/models/setup/configuration_transfer.h"
+#include "desktop/windows/batch/batch_runner.h"
+#include "desktop/windows/setup/format_list.h"
+#include "desktop/windows/shell/help.h"
+#include "desktop/windows/shell/looks.h"
+#include "desktop/windows/shell/main_frame.h"
+#include "desktop/windows/shell/wx_text.h"
+#include "platform/files.h"
+#include "settings/configuration.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+constexpr const char* kSetupTitle = "Setup";
+constexpr const char* kTransferFiles = "Settings (*.ini)|*.ini|All files|*";
+
+// Settings never change during a batch. False after a message when one is running.
+bool MayChangeSettings(wxWindow& window) {
+  auto* const frame = dynamic_cast<MainFrame*>(wxTheApp->GetTopWindow());
+  if (frame == nullptr || !frame->Batches().Running()) return true;
+  wxMessageBox("A batch is running with the settings as they are. Change them when it has ended.", kSetupTitle,
+               wxOK | wxICON_INFORMATION, &window);
+  return false;
+}
+
+// Takes up what the controls hold and saves it. False after a message about the control that holds something else.
+bool TakeSettings(wxWindow& window, const BoundControls& controls, const std::function<void(uint32_t)>& show, bool& changed) {
+  const RegistryDestinations destinations;
+  if (!MayChangeSettings(window)) return false;
+  if (const auto fault = ReadSetupDialog(controls, destinations)) {
+    show(fault->control);
+    wxMessageBox(Shown(fault->message), kSetupTitle, wxOK | wxICON_WARNING, &window);
+    if (wxWindow* control = controls.Find(fault->control)) control->SetFocus();
+    return false;
+  }
+  const SaveResult saved = SaveConfiguration();
+  changed = saved != SaveResult::Unchanged;
+  if (const std::string_view message = SaveMessage(saved); !message.empty()) {
+    wxMessageBox(Shown(std::string(message) + " The settings count until the program ends."), kSetupTitle, wxOK | wxICON_WARNING,
+                 &window);
+  }
+  return true;
+}
+
+}  // namespace
+
+SetupBox::SetupBox(wxWindow* parent, std::function<void()> applied, SetupPage first)
+    : wxDialog(parent, wxID_ANY, kSetupTitle, wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
+               "SetupBox"),
+      applied_(std::move(applied)),
+      controls_(*this),
+      page_(first) {
+  const int gap = FromDIP(10);
+  search_ = new wxSearchCtrl(this, wxID_ANY, wxEmptyString, wxDefaultPosition, FromDIP(wxSize(230, -1)));
+  search_->SetDescriptiveText("Search settings");
+  search_->ShowCancelButton(true);
+  search_->SetName("Search settings");
+  list_ = new wxListBox(this, wxID_ANY, wxDefaultPosition, wxDefaultSize, 0, nullptr, wxLB_SINGLE);
+  list_->SetName("Pages");
+  title_ = new wxStaticText(this, wxID_ANY, TitleOf(first));
+  title_->SetFont(title_->GetFont().Bold().Scaled(1.3f));
+  BuildPages();
+
+  auto* left = new wxBoxSizer(wxVERTICAL);
+  left->Add(search_, wxSizerFlags().Expand());
+  left->Add(list_, wxSizerFlags(1).Expand().Border(wxTOP, gap));
+  auto* right = new wxBoxSizer(wxVERTICAL);
+  right->Add(title_, wxSizerFlags().Border(wxLEFT, FromDIP(8)));
+  right->Add(book_, wxSizerFlags(1).Expand());
+  auto* middle = new wxBoxSizer(wxHORIZONTAL);
+  middle->Add(left, wxSizerFlags().Expand().Border(wxALL, gap));
+  middle->Add(right, wxSizerFlags(1).Expand().Border(wxTOP | wxRIGHT | wxBOTTOM, gap));
+  auto* column = new wxBoxSizer(wxVERTICAL);
+  column->Add(middle, wxSizerFlags(1).Expand());
+  column->Add(BuildButtons(), wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, gap));
+  SetSizer(column);
+  SetSize(TextWidth(*this, 980), TextWidth(*this, 680));
+  SetMinSize(FromDIP(wxSize(760, 420)));
+
+  FillSetupDialog(controls_, destinations_);
+  TakeSetupChanged();
+  ControlChanged();
+  ShowPages();
+  ShowPage(first);
+  search_->Bind(wxEVT_TEXT, [this](wxCommandEvent&) { ShowPages(); });
+  search_->Bind(wxEVT_SEARCH, [this](wxCommandEvent&) { ChooseLine(true); });
+  search_->Bind(wxEVT_SEARCH_CANCEL, [this](wxCommandEvent&) { search_->Clear(); });
+  list_->Bind(wxEVT_LISTBOX, [this](wxCommandEvent&) { ChooseLine(false); });
+  list_->Bind(wxEVT_SET_FOCUS, [](wxFocusEvent& event) {
+    LogEvent("setup", "list has the keyboard");
+    event.Skip();
+  });
+  list_->Bind(wxEVT_LISTBOX_DCLICK, [this](wxCommandEvent&) { ChooseLine(true); });
+  BindSettingsHelp(*this);
+  Bind(wxEVT_CHAR_HOOK, [this](wxKeyEvent& event) {
+    if (event.GetKeyCode() != 'F' || event.GetModifiers() != wxMOD_CONTROL) return event.Skip();
+    search_->SetFocus();
+    LogEvent("setup", "search");
+  });
+  CentreOnParent();
+  list_->SetFocus();
+}
+
+// --- pages ---
+
+void SetupBox::BuildPages() {
+  book_ = new wxSimplebook(this);
+  for (size_t page = 0; page < kSetupPageCount; ++page) {
+    std::function<wxWindow*(wxWindow*)> above;
+    if (static_cast<SetupPage>(page) == SetupPage::Formats)
+      above = [](wxWindow* parent) -> wxWindow* { return new FormatList(parent); };
+    auto* panel = new SettingsPanel(
+        book_, ItemsOf(static_cast<SetupPage>(page)), [this] { ControlChanged(); }, above);
+    book_->AddPage(panel, TitleOf(static_cast<SetupPage>(page)));
+    panels_.push_back(panel);
+  }
+}
+
+SettingsPanel& SetupBox::Panel() const { return *panels_[static_cast<size_t>(page_)]; }
+
+void SetupBox::ShowPages() {
+  const std::string words = Utf8(search_->GetValue());
+  searching_ = words.find_first_not_of(' ') != std::string::npos;
+  found_ = FindSettings(words);
+  wxArrayString lines;
+  if (searching_) {
+    for (const SetupItem& item : found_) lines.Add(wxString(item.group) + ": " + item.label);
+  } else {
+    for (size_t page = 0; page < kSetupPageCount; ++page) lines.Add(TitleOf(static_cast<SetupPage>(page)));
+  }
+  list_->Set(lines);
+  if (searching_ && !found_.empty()) {
+    list_->SetSelection(0);
+    ChooseLine(false);
+  }
+  if (!searching_) list_->SetSelection(static_cast<int>(page_));
+}
+
+void SetupBox::ChooseLine(bool focus) {
+  const int line = list_->GetSelection();
+  if (line == wxNOT_FOUND) return;
+  if (!searching_) return ShowPage(static_cast<SetupPage>(line));
+  const SetupItem& item = found_[static_cast<size_t>(line)];
+  ShowPage(item.page);
+  wxWindow* const control = controls_.Find(KeyOf(item.key).control);
+  if (control == nullptr) return;
+  SettingsPanel& panel = Panel();
+  const wxPoint place = panel.CalcUnscrolledPosition(panel.ScreenToClient(control->GetScreenPosition()));
+  int unused = 0, step = 1;
+  panel.GetScrollPixelsPerUnit(&unused, &step);
+  panel.Scroll(-1, std::max(place.y - FromDIP(60), 0) / std::max(step, 1));
+  if (focus) control->SetFocus();
+}
+
+void SetupBox::ShowPage(SetupPage page) {
+  page_ = page;
+  book_->SetSelection(static_cast<size_t>(page));
+  title_->SetLabel(TitleOf(page));
+  if (!searching_) list_->SetSelection(static_cast<int>(page));
+  LogEvent("setup", std::string("page=") + TitleOf(page) + " found=" + std::to_string(found_.size()));
+}
+
+void SetupBox::ControlChanged() {
+  for (SettingsPanel* panel : panels_) panel->UpdateMarks(controls_);
+}
+
+// --- buttons ---
+
+wxSizer* SetupBox::BuildButtons() {
+  struct Button {
+    const char* label;
+    const char* tip;
+    void (SetupBox::*run)();
+  };
+  static constexpr Button kButtons[] = {
+      {"&Reset page", "Gives every setting of this page its default. Nothing is saved before OK or Apply.", &SetupBox::ResetPage},
+      {"&Import...", "Takes settings from a file.", &SetupBox::Import},
+      {"&Export...", "Writes the saved settings to a file.", &SetupBox::Export},
+      {"Open &data folder", "Shows the folder of the settings, the file history and the global thumbnail database.",
+       &SetupBox::OpenDataFolder},
+  };
+  auto* row = new wxBoxSizer(wxHORIZONTAL);
+  for (const Button& button : kButtons) {
+    auto* control = new wxButton(this, wxID_ANY, button.label);
+    control->SetToolTip(button.tip);
+    control->Bind(wxEVT_BUTTON, [this, run = button.run](wxCommandEvent&) { (this->*run)(); });
+    row->Add(control, wxSizerFlags().Border(wxRIGHT, FromDIP(6)));
+  }
+  row->AddStretchSpacer();
+  row->Add(CreateButtonSizer(wxOK | wxCANCEL | wxAPPLY | wxHELP), wxSizerFlags());
+  Bind(
+      wxEVT_BUTTON,
+      [this](wxCommandEvent&) {
+        if (Apply()) EndModal(wxID_OK);
+      },
+      wxID_OK);
+  Bind(
+      wxEVT_BUTTON, [this](wxCommandEvent&) { (void)Apply(); }, wxID_APPLY);
+  Bind(
+      wxEVT_BUTTON, [this](wxCommandEvent&) { ShowHelp(*this, kGeneralHelpPage); }, wxID_HELP);
+  return row;
+}
+
+bool SetupBox::Apply() {
+  bool changed = false;
+  const auto show = [this](uint32_t control) {
+    const KeyRow* const row = FindKeyOfControl(control);
+    for (const SetupItem& item : SetupItems()) {
+      if (&KeyOf(item.key) == row) ShowPage(item.page);
+    }
+  };
+  if (!TakeSettings(*this, controls_, show, changed)) return false;
+  if (TakeSetupChanged() || changed) applied_();
+  LogEvent("setup", changed ? "applied changed=1" : "applied changed=0");
+  return true;
+}
+
+void SetupBox::ResetPage() {
+  FillSetupDialog(controls_, destinations_, Panel().Rows(), SetupValues::Default);
+  for (const SetupItem& item : Panel().Items()) NoteControlChanged(KeyOf(item.key).control);
+  ControlChanged();
+  LogEvent("setup", "reset");
+}
+
+void SetupBox::Import() {
+  if (!MayChangeSettings(*this)) return;
+  wxFileDialog dialog(this, "Import settings", wxEmptyString, wxEmptyString, kTransferFiles, wxFD_OPEN | wxFD_FILE_MUST_EXIST);
+  if (dialog.ShowModal() != wxID_OK) return;
+  const Transfer transfer = ImportConfiguration(Utf8(dialog.GetPath()));
+  FillSetupDialog(controls_, destinations_);
+  ControlChanged();
+  if (transfer.ok) applied_();
+  Report(transfer.ok, transfer.message);
+}
+
+void SetupBox::Export() {
+  wxFileDialog dialog(this, "Export settings", wxEmptyString, "Fotomill settings.ini", kTransferFiles,
+                      wxFD_SAVE | wxFD_OVERWRITE_PROMPT);
+  if (dialog.ShowModal() != wxID_OK) return;
+  const Transfer transfer = ExportConfiguration(Utf8(dialog.GetPath()));
+  Report(transfer.ok, transfer.message);
+}
+
+void SetupBox::OpenDataFolder() {
+  const std::string& folder = DataFolder();
+  if (folder.empty() || !platform::MakeFolders(folder)) return Report(false, "There is no data folder, and none could be made.");
+  if (!wxLaunchDefaultApplication(wxString::FromUTF8(folder))) {
+    Report(false, "No program could be found that shows the folder \"" + folder + "\".");
+  }
+}
+
+void SetupBox::Report(bool ok, const std::string& message) {
+  wxMessageBox(Shown(message), kSetupTitle, wxOK | (ok ? wxICON_INFORMATION : wxICON_WARNING), this);
+}
+
+// --- a few settings ---
+
+bool ShowSettingsBox(wxWindow* parent, const wxString& title, const wxString& name, const std::vector<SetupItem>& items) {
+  wxDialog dialog(parent, wxID_ANY, title, wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, name);
+  BoundControls controls(dialog);
+  const RegistryDestinations destinations;
+  SettingsPanel* panel = nullptr;
+  panel = new SettingsPanel(&dialog, items, [&] {
+    if (panel != nullptr) panel->UpdateMarks(controls);
+  });
+  FillSetupDialog(controls, destinations);
+  panel->UpdateMarks(controls);
+  auto* reset = new wxButton(&dialog, wxID_ANY, "&Reset");
+  reset->SetToolTip("Gives all of these settings their defaults.");
+  reset->Bind(wxEVT_BUTTON, [&](wxCommandEvent&) {
+    FillSetupDialog(controls, destinations, panel->Rows(), SetupValues::Default);
+    panel->UpdateMarks(controls);
+  });
+  auto* buttons = new wxBoxSizer(wxHORIZONTAL);
+  buttons->Add(reset);
+  buttons->AddStretchSpacer();
+  buttons->Add(dialog.CreateButtonSizer(wxOK | wxCANCEL));
+  auto* column = new wxBoxSizer(wxVERTICAL);
+  panel->SetMinSize(panel->GetSizer()->GetMinSize() + dialog.FromDIP(wxSize(20, 4)));
+  column->Add(panel, wxSizerFlags(1).Expand());
+  column->Add(buttons, wxSizerFlags().Expand().Border(wxALL, dialog.FromDIP(10)));
+  dialog.SetSizerAndFit(column);
+  dialog.Bind(
+      wxEVT_BUTTON,
+      [&](wxCommandEvent&) {
+        bool changed = false;
+        if (TakeSettings(
+                dialog, controls, [](uint32_t) {}, changed))
+          dialog.EndModal(wxID_OK);
+      },
+      wxID_OK);
+  BindSettingsHelp(dialog);
+  dialog.CentreOnParent();
+  LogEvent("settings", std::string("box=") + Utf8(name));
+  return dialog.ShowModal() == wxID_OK;
+}
+
+}  // namespace fotomill::desktop

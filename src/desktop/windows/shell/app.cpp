@@ -1,0 +1,134 @@
+#include <wx/app.h>
+#include <wx/cmdline.h>
+#include <wx/weakref.h>
+
+#include <wx/image.h>
+#include <cstdlib>
+#include <functional>
+#include <memory>
+#include <string>
+
+#include "core/data_folder.h"
+#include "desktop/models/browser/event_log.h"
+#include "desktop/models/browser/previous_file.h"
+#include "desktop/models/view/view_picture.h"
+#include "desktop/windows/setup/override_box.h"
+#include "desktop/windows/shell/main_frame.h"
+#include "desktop/windows/shell/screen_profile.h"
+#include "desktop/windows/shell/wx_text.h"
+#include "desktop/windows/widgets/control_names.h"
+#include "platform/first_start.h"
+#include "platform/folders.h"
+#include "platform/process.h"
+#include "plugins/plugin_table.h"
+#include "registry/registry.h"
+#include "settings/configuration.h"
+#include "settings/format_switches.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+constexpr double kHandOverSeconds = 2;  // that a running program has to answer
+
+// Starts of the same user on the same screen with the same data folder are one program.
+std::string NameOfInstance() {
+  std::string place = DataFolder();
+  for (const char* variable : {"WAYLAND_DISPLAY", "DISPLAY"}) {
+    const char* const screen = std::getenv(variable);
+    if (screen != nullptr) place += std::string("\n") + screen;
+  }
+  return std::to_string(std::hash<std::string>()(place));
+}
+
+}  // namespace
+
+class App : public wxApp {
+ public:
+  void OnInitCmdLine(wxCmdLineParser& parser) override {
+    parser.SetSwitchChars("-");
+    parser.AddSwitch("h", "help", "tells how to call the program", wxCMD_LINE_OPTION_HELP);
+    parser.AddLongSwitch(kNewInstance, "opens a frame of its own, even where the program is running");
+    parser.AddParam("FOLDER or FILE", wxCMD_LINE_VAL_STRING, wxCMD_LINE_PARAM_OPTIONAL);
+  }
+  bool OnCmdLineParsed(wxCmdLineParser& parser) override {
+    if (parser.GetParamCount() > 0) argument_ = platform::AbsolutePath(Utf8(parser.GetParam(0)));
+    newInstance_ = parser.Found(kNewInstance);
+    return true;
+  }
+
+  bool OnInit() override {
+    platform::FillStandardStreams();
+    StartEventLog();
+    SetAppName("fotomill-desktop");
+    SetAppDisplayName("Fotomill Professional");
+    if (!wxApp::OnInit()) return false;
+    wxImage::AddHandler(new wxPNGHandler);  // pictures travel over the clipboard as PNG
+    SetDataFolder({});
+    if (!newInstance_ && HandOver()) return true;
+    (void)LoadConfiguration();
+    TakeFormatSwitches();
+    NameControlsAsTheyCome();
+    InstallOverrideBoxes();
+    RunFormatStartup();
+    formatsStarted_ = true;
+    EnablePlugins();
+    DeleteOldPreviousFiles();
+    std::vector<uint8_t> screen = ReadScreenProfile();
+    LogEvent("screen-profile", std::to_string(screen.size()));
+    SetScreenProfile(std::move(screen));
+    frame_ = new MainFrame;
+    frame_->RestorePlace();
+    frame_->Show();
+    LogEvent("frame");
+    frame_->OpenStart(argument_, true);
+    firstStart_.Listen([this](std::shared_ptr<platform::LaterStart> start) {
+      CallAfter([this, start = std::move(start)] { TakeOver(*start); });
+    });
+    return true;
+  }
+
+  // The log is told which window has the keyboard.
+  int FilterEvent(wxEvent& event) override {
+    if (EventLogOn() && event.GetEventType() == wxEVT_ACTIVATE && static_cast<wxActivateEvent&>(event).GetActive()) {
+      const auto* window = dynamic_cast<wxTopLevelWindow*>(event.GetEventObject());
+      if (window != nullptr) LogEvent("active", Utf8(window->GetTitle()));
+    }
+    return Event_Skip;
+  }
+
+  // One that has handed over has no window to wait for.
+  int OnRun() override { return frame_ == nullptr ? 0 : wxApp::OnRun(); }
+
+  int OnExit() override {
+    if (formatsStarted_) RunFormatShutdown();
+    return wxApp::OnExit();
+  }
+
+ private:
+  static constexpr const char* kNewInstance = "new-instance";
+
+  bool HandOver() {
+    const auto standing = firstStart_.Begin(NameOfInstance(), argument_, kHandOverSeconds);
+    if (standing == platform::FirstStart::Standing::HandedOver) LogEvent("handed-over", argument_);
+    return standing == platform::FirstStart::Standing::HandedOver;
+  }
+
+  void TakeOver(platform::LaterStart& start) {
+    if (frame_ == nullptr || !start.Take()) return;
+    LogEvent("taken-over", start.Message());
+    if (frame_->IsIconized()) frame_->Iconize(false);
+    frame_->Raise();
+    frame_->OpenStart(start.Message(), false);
+  }
+
+  std::string argument_;  // an absolute path, or empty
+  bool newInstance_ = false;
+  bool formatsStarted_ = false;
+  wxWeakRef<MainFrame> frame_;
+  platform::FirstStart firstStart_;
+};
+
+}  // namespace fotomill::desktop
+
+wxIMPLEMENT_APP(fotomill::desktop::App);

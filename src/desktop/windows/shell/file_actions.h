@@ -1,0 +1,80 @@
+#pragma once
+
+#include <wx/event.h>
+
+#include <atomic>
+#include <functional>
+#include <string>
+#include <thread>
+#include <vector>
+
+#include "desktop/models/browser/file_deeds.h"
+#include "processing/geometry/orient.h"
+
+namespace fotomill::desktop {
+
+class MainFrame;
+
+// What the frame does to files: on a thread of its own, one thing after the other, told of in the status bar, and kept so
+// that it can be taken back.
+class FileActions : public wxEvtHandler {
+ public:
+  explicit FileActions(MainFrame& frame);
+  ~FileActions() override;
+
+  // False when the user was asked and does not want it, where there is no trash.
+  bool Trash(const std::vector<std::string>& paths);
+  // The same of a file that `view` shows; asks first if PromptDeleteFromView wants it. False when the answer was no, or
+  // other files are in work.
+  bool TrashFromView(wxWindow* view, const std::string& path);
+  // Asks first. False when the answer was no.
+  bool Delete(const std::vector<std::string>& paths);
+  void CopyTo(const std::vector<std::string>& paths, const std::string& folder);
+  void MoveTo(const std::vector<std::string>& paths, const std::string& folder);
+  void Rename(const std::string& path, const std::string& name);
+  // Several files at once, as the caller has planned it.
+  void RenameAll(std::vector<FileStep> steps);
+  void NewFolder(const std::string& parent);
+  // Turns the picture in a file; `then` is told whether that was done, with a remark. False when something else is being done.
+  using Turned = std::function<void(bool done, const std::string& note)>;
+  bool SaveTurned(const std::string& path, Orientation turn, Turned then);
+
+  void Undo();
+  void Redo();
+  // Somebody else did it; it can be taken back like the rest.
+  void NoteDone(FileDeed deed) { undo_.Add(std::move(deed)); }
+  const UndoList& Undoable() const { return undo_; }
+  bool Busy() const { return busy_; }
+  void Stop() { stop_ = true; }
+
+  // The clipboard holds the files for other programs too; `cut` asks whoever pastes to move them.
+  void ToClipboard(const std::vector<std::string>& paths, bool cut);
+  void PathsToClipboard(const std::vector<std::string>& paths);
+  // Files, or else a picture, which becomes a file.
+  void Paste(const std::string& folder);
+
+ private:
+  using Work = std::function<DeedResult(const DeedProgress& progress)>;
+  using Then = std::function<void(DeedResult result)>;
+  void Run(const std::string& what, Work work, Then then);
+  void Do(DeedKind kind, const std::vector<std::string>& paths, const std::string& folder);
+  void Finished(const std::string& what, DeedResult result, const Then& then);
+  void PastePicture(const std::string& folder);
+  // Windows that show a renamed or moved folder go with it.
+  void Follow(const FileDeed& deed, bool back);
+  void TellFailures(const std::vector<DeedFailure>& failures);
+
+  MainFrame& frame_;
+  UndoList undo_;
+  std::thread thread_;
+  std::atomic<bool> stop_{false};
+  bool busy_ = false;
+};
+
+// Functions of the frame's menu.
+void TrashSelection(MainFrame& frame);
+void DeleteSelection(MainFrame& frame);
+void CopySelectionTo(MainFrame& frame);
+void MoveSelectionTo(MainFrame& frame);
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,51 @@
+#include "desktop/windows/view/slideshow_dialog.h"
+
+#include <wx/button.h>
+#include <wx/checkbox.h>
+#include <wx/choice.h>
+#include <wx/dialog.h>
+#include <wx/sizer.h>
+#include <wx/spinctrl.h>
+#include <wx/stattext.h>
+
+#include "desktop/models/browser/event_log.h"
+
+namespace fotomill::desktop {
+
+std::optional<SlideshowChoices> AskForSlideshow(wxWindow& parent, const SlideshowChoices& choices) {
+  wxDialog dialog(&parent, wxID_ANY, "Slideshow", wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE, "SlideshowBox");
+  const int gap = dialog.FromDIP(10);
+  auto* grid = new wxFlexGridSizer(2, gap, gap);
+  const auto label = [&](const char* text) {
+    grid->Add(new wxStaticText(&dialog, wxID_ANY, text), wxSizerFlags().CenterVertical());
+  };
+  label("&Seconds that a picture stays:");
+  auto* seconds = new wxSpinCtrl(&dialog, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxSP_ARROW_KEYS, 1,
+                                 SlideshowChoices::kMostSeconds, choices.seconds);
+  grid->Add(seconds);
+  label("&Order:");
+  const wxString orders[] = {"as in the list", "random"};
+  auto* order = new wxChoice(&dialog, wxID_ANY, wxDefaultPosition, wxDefaultSize, static_cast<int>(std::size(orders)), orders);
+  order->SetSelection(choices.random ? 1 : 0);
+  grid->Add(order);
+  auto* repeat = new wxCheckBox(&dialog, wxID_ANY, "&Begin again after the last picture");
+  repeat->SetValue(choices.repeat);
+  auto* buttons = new wxBoxSizer(wxHORIZONTAL);
+  auto* start = new wxButton(&dialog, wxID_OK, "S&tart");
+  buttons->AddStretchSpacer();
+  buttons->Add(new wxButton(&dialog, wxID_CANCEL), wxSizerFlags().Border(wxRIGHT, gap));
+  buttons->Add(start);
+  auto* column = new wxBoxSizer(wxVERTICAL);
+  column->Add(grid, wxSizerFlags().Border(wxALL, gap));
+  column->Add(repeat, wxSizerFlags().Border(wxLEFT | wxRIGHT, gap));
+  column->Add(buttons, wxSizerFlags().Expand().Border(wxALL, gap));
+  dialog.SetSizerAndFit(column);
+  dialog.CentreOnParent();
+  start->SetDefault();
+  seconds->SetFocus();
+  LogEvent("prompt", "slideshow");
+  if (dialog.ShowModal() != wxID_OK) return std::nullopt;
+  return SlideshowChoices{seconds->GetValue(), order->GetSelection() == 1, repeat->GetValue()};
+}
+
+}  // namespace fotomill::desktop

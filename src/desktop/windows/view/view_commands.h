@@ -1,0 +1,12 @@
+#pragma once
+
+#include "desktop/windows/shell/key_commands.h"
+
+namespace fotomill::desktop {
+
+class ViewFrame;
+
+// What a view window can do.
+std::span<const KeyCommand<ViewFrame>> ViewCommands();
+
+}  // namespace fotomill::desktop

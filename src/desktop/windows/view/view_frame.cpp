@@ -1,0 +1,430 @@
+#include "desktop/windows/view/view_frame.h"
+
+#include <wx/clipbrd.h>
+#include <wx/weakref.h>
+
+#include <algorithm>
+#include <cmath>
+
+#include "catalog/history/file_history.h"
+#include "core/text.h"
+#include "desktop/models/browser/event_log.h"
+#include "desktop/models/view/rgb_image.h"
+#include "desktop/windows/shell/file_actions.h"
+#include "desktop/windows/shell/main_frame.h"
+#include "desktop/windows/shell/screen_reader.h"
+#include "desktop/windows/shell/wx_text.h"
+#include "desktop/windows/view/info_frame.h"
+#include "desktop/windows/view/view_commands.h"
+#include "desktop/windows/widgets/bitmaps.h"
+#include "platform/clock.h"
+#include "platform/files.h"
+#include "platform/paths.h"
+#include "settings/configuration.h"
+#include "settings/settings.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+constexpr uint64_t kAheadBytes = 768ull * 1024 * 1024;  // of decoded pictures
+constexpr int kPointerMs = 2000;
+
+}  // namespace
+
+ViewFrame::ViewFrame(MainFrame& frame, const std::vector<std::string>& list, const std::string& file)
+    : wxFrame(&frame, wxID_ANY, "View", wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE, "FotomillProfessionalView"),
+      frame_(frame),
+      list_(list),
+      pointerTimer_(this),
+      slideshow_({.busy = [this] { return animation_->MustFinish(); }, .show = [this](size_t place) { GoTo(place); }}) {
+  place_ = static_cast<size_t>(std::find(list_.begin(), list_.end(), file) - list_.begin());
+  if (place_ == list_.size()) {
+    list_ = {file};
+    place_ = 0;
+  }
+  SetSize(frame.GetSize());
+  loader_ = std::make_unique<ViewLoader>(kAheadBytes, [this] { CallAfter([this] { PictureCame(); }); });
+  canvas_ = new ViewCanvas(
+      this, {.resized = [this] { Resized(); }, .changed = [this] { ViewChanged(); }, .painted = [this] { LogPaint(); }});
+  bar_ = new AnimationBar(this, {.toggle = [this] { PlayOrNext(), canvas_->SetFocus(); },
+                                 .step = [this](int frames) { StepFrame(frames), canvas_->SetFocus(); }});
+  animation_ = std::make_unique<ViewAnimation>(
+      *canvas_, *bar_,
+      ViewAnimation::Events{.changed = [this] { ViewChanged(); },
+                            .dressed = [this](const ViewPicturePointer& picture) { return Turned(picture); }});
+  auto* column = new wxBoxSizer(wxVERTICAL);
+  column->Add(canvas_, wxSizerFlags(1).Expand());
+  column->Add(bar_, wxSizerFlags().Expand());
+  SetSizer(column);
+  CreateStatusBar();
+  canvas_->SetFocus();
+  canvas_->Bind(wxEVT_KEY_DOWN, &ViewFrame::OnKey, this);
+  canvas_->Bind(wxEVT_RIGHT_DOWN, [this](wxMouseEvent& event) { ShowMenu(event.GetPosition()); });
+  canvas_->Bind(wxEVT_MOTION, [this](wxMouseEvent& event) {
+    HidePointerLater();
+    event.Skip();
+  });
+  Bind(
+      wxEVT_TIMER,
+      [this](wxTimerEvent&) {
+        if (IsFullScreen()) canvas_->SetCursor(wxCursor(wxCURSOR_BLANK));
+      },
+      pointerTimer_.GetId());
+  if (settings.MaximizeViewWindow != 0) Maximize();
+  ShowPlace();
+}
+
+ViewFrame::~ViewFrame() {
+  // Their threads call back into this window.
+  animation_.reset();
+  loader_.reset();
+  if (shown_) frame_.CallAfter(shown_);
+}
+
+// --- which picture ---
+
+ViewWish ViewFrame::WishOf(size_t place) const {
+  const wxSize size = canvas_->DeviceSize();
+  return {list_[place], place == place_ ? page_ : 0, size.x, size.y};
+}
+
+void ViewFrame::Step(int files) {
+  const int64_t count = static_cast<int64_t>(list_.size());
+  const int64_t place = (static_cast<int64_t>(place_) + files % count + count) % count;
+  GoTo(static_cast<size_t>(place));
+}
+
+void ViewFrame::GoTo(size_t place) {
+  if (place >= list_.size() || (place == place_ && page_ == 0 && canvas_->Picture() != nullptr)) return;
+  place_ = place;
+  StartAfresh();
+}
+
+void ViewFrame::StepPage(int pages) {
+  if (animation_->Active()) return animation_->Step(pages);
+  const ViewPicturePointer& shown = canvas_->Picture();
+  if (shown == nullptr || shown->picture == nullptr) return;
+  const int32_t page = page_ + pages;
+  if (page < 0 || page >= shown->picture->pageCount) return;
+  page_ = page;
+  turn_ = Orientation::Upright;
+  note_.clear();
+  ShowPlace();
+}
+
+void ViewFrame::StartAfresh() {
+  page_ = 0;
+  note_.clear();
+  turn_ = Orientation::Upright;
+  canvas_->StartAfresh();
+  ShowPlace();
+}
+
+void ViewFrame::StepFrame(int frames) {
+  if (animation_->Active()) animation_->Step(frames);
+}
+
+void ViewFrame::PlayOrNext() {
+  if (!animation_->Active()) return Step(1);
+  animation_->Toggle();
+}
+
+void ViewFrame::ShowPlace() {
+  if (AskForPicture()) return;
+  ShowStandIn();
+  ViewChanged();
+}
+
+// Whether the picture was there already, and is shown.
+bool ViewFrame::AskForPicture() {
+  animation_->End();
+  keyTime_ = platform::MonotonicSeconds();
+  WantPictures();
+  ViewPicturePointer ready = loader_->Find(WishOf(place_));
+  if (ready != nullptr && ready->HasChanged()) {
+    loader_->Forget(list_[place_]);
+    WantPictures();
+    ready = nullptr;
+  }
+  if (ready != nullptr) TakePicture(ready);
+  return ready != nullptr;
+}
+
+// Until the picture is there its thumbnail stands in, where the browser has one.
+void ViewFrame::ShowStandIn() {
+  const ThumbnailPointer thumbnail = frame_.Thumbnails().FindAny(list_[place_]);
+  PackedImage image;
+  if (thumbnail == nullptr || thumbnail->pixels.Empty() || ToPacked(thumbnail->pixels, image) != Status::Ok) return;
+  constexpr int32_t kUnknown = 16;  // times the thumbnail, where its picture's size is not known
+  const bool known = thumbnail->width > 0;
+  int32_t width = known ? thumbnail->width : image.Width() * kUnknown;
+  int32_t height = known ? thumbnail->height : image.Height() * kUnknown;
+  if ((width > height) != (image.Width() > image.Height())) std::swap(width, height);  // it was turned upright
+  canvas_->ShowStandIn(std::move(image), width, height);
+}
+
+// The picture itself, then what the slideshow goes to, then two each way.
+void ViewFrame::WantPictures() {
+  if (loader_ == nullptr || canvas_ == nullptr) return;
+  std::vector<ViewWish> wishes;
+  const auto want = [&](size_t place) {
+    ViewWish wish = WishOf(place);
+    const auto same = [&](const ViewWish& other) { return other.SamePicture(wish); };
+    if (std::none_of(wishes.begin(), wishes.end(), same)) wishes.push_back(std::move(wish));
+  };
+  want(place_);
+  if (const auto upcoming = slideshow_.Upcoming(); upcoming && *upcoming < list_.size()) want(*upcoming);
+  const int64_t count = static_cast<int64_t>(list_.size());
+  for (const int64_t step : {1, -1, 2, -2}) {
+    want(static_cast<size_t>(((static_cast<int64_t>(place_) + step) % count + count) % count));
+  }
+  loader_->Want(std::move(wishes));
+}
+
+void ViewFrame::PictureCame() {
+  if (IsCurrent(loaded_)) return;
+  if (const ViewPicturePointer ready = loader_->Find(WishOf(place_))) TakePicture(ready);
+}
+
+void ViewFrame::TakePicture(ViewPicturePointer picture) {
+  LogEvent("view", "place=" + std::to_string(place_ + 1) + "/" + std::to_string(list_.size()) +
+                       " page=" + std::to_string(page_ + 1) + " status=" + std::to_string(StatusNumber(picture->status)) +
+                       " ms=" + std::to_string(std::lround((platform::MonotonicSeconds() - keyTime_) * 1000)) +
+                       " file=" + list_[place_]);
+  if (picture->picture != nullptr) frame_.NoteUses({FileUse{list_[place_], FileFunction::View}});
+  loaded_ = std::move(picture);
+  ShowTurned();
+  animation_->Begin(loaded_);
+  slideshow_.ShownAt(place_, list_.size());
+  if (shown_) frame_.CallAfter(std::exchange(shown_, nullptr));
+}
+
+void ViewFrame::WhenShown(std::function<void()> shown) {
+  if (IsCurrent(loaded_)) return frame_.CallAfter(shown);  // a small one may have come already
+  shown_ = std::move(shown);
+}
+
+bool ViewFrame::TakeList(const std::vector<std::string>& list) {
+  const auto found = std::ranges::find(list, list_[place_]);
+  if (found == list.end()) return false;
+  place_ = static_cast<size_t>(found - list.begin());
+  list_ = list;
+  WantPictures();
+  ViewChanged();
+  LogEvent("view-list", std::to_string(place_ + 1) + "/" + std::to_string(list_.size()));
+  return true;
+}
+
+void ViewFrame::Resized() {
+  if (animation_ == nullptr) return;  // still being made
+  WantPictures();
+  animation_->Resized();
+}
+
+void ViewFrame::ShowTurned() {
+  if (animation_->Active()) return animation_->ShowAgain();
+  ViewPicturePointer turned = Turned(loaded_);
+  if (turned == nullptr) return wxBell();
+  canvas_->Show(std::move(turned));
+}
+
+// A picture, or a frame of it, as it is to be shown; null where there is no memory for that.
+ViewPicturePointer ViewFrame::Turned(const ViewPicturePointer& picture) const {
+  const bool turns = turn_ != Orientation::Upright && picture->picture != nullptr;
+  return turns ? TurnedView(*picture, turn_) : picture;
+}
+
+bool ViewFrame::IsCurrent(const ViewPicturePointer& picture) const {
+  return picture != nullptr && picture->wish.SamePicture(WishOf(place_));
+}
+
+// --- showing ---
+
+// Each picture and zoom once, with the time since the picture was asked for; each frame of an animation.
+void ViewFrame::LogPaint() {
+  if (animation_->Active()) LogEvent("view-frame", animation_->StatusText());
+  const std::string shown = std::to_string(std::lround(canvas_->Zoom() * 100)) + "% " + canvas_->Picture()->wish.path;
+  if (shown == painted_) return;
+  painted_ = shown;
+  LogEvent("view-painted", shown + " ms=" + std::to_string(std::lround((platform::MonotonicSeconds() - keyTime_) * 1000)));
+}
+
+std::string ViewFrame::StatusLine() const {
+  std::string line = std::to_string(place_ + 1) + " of " + WithThousands(list_.size());
+  const ViewPicturePointer& shown = canvas_->Picture();
+  if (!IsCurrent(shown)) return line + ", loading...";
+  if (shown->picture == nullptr) return line + ", " + std::string(StatusMessage(shown->status));
+  const PictureRecord& picture = *shown->picture;
+  line += ", " + SizeAndZoom(picture, canvas_->Zoom());
+  if (turn_ != Orientation::Upright) line += ", turned, not saved";
+  if (animation_->Active()) {
+    line += ", " + animation_->StatusText();
+  } else if (picture.pageCount > 1) {
+    line += ", page " + std::to_string(page_ + 1) + " of " + std::to_string(picture.pageCount);
+  }
+  if (!note_.empty()) line += ". " + note_;
+  return line;
+}
+
+// Name, what the status bar tells, what the camera wrote.
+std::vector<std::string> ViewFrame::OverlayLines() const {
+  std::vector<std::string> lines = {std::string(platform::FileNameOf(list_[place_])), StatusLine()};
+  const ViewPicturePointer& shown = canvas_->Picture();
+  if (IsCurrent(shown)) lines.insert(lines.end(), shown->photo.begin(), shown->photo.end());
+  return lines;
+}
+
+void ViewFrame::ViewChanged() {
+  if (canvas_ == nullptr || GetStatusBar() == nullptr) return;  // still being made
+  const std::string line = StatusLine();
+  const wxString name = Shown(platform::FileNameOf(list_[place_]));
+  const wxString title = name + (turn_ == Orientation::Upright ? "" : " (turned, not saved)") + " - View";
+  if (title != GetTitle()) SetTitle(title);
+  SetStatusText(Shown(line));
+  // A number that changes many times a second is nothing to listen to.
+  if (!animation_->Playing()) TellScreenReader(*canvas_, name, Shown(line));
+  canvas_->SetOverlay(overlay_ ? OverlayLines() : std::vector<std::string>());
+}
+
+void ViewFrame::ToggleFullScreen() {
+  ShowFullScreen(!IsFullScreen());
+  animation_->HideBar(IsFullScreen());
+  HidePointerLater();
+}
+
+void ViewFrame::HidePointerLater() {
+  canvas_->SetCursor(wxNullCursor);
+  if (IsFullScreen()) pointerTimer_.StartOnce(kPointerMs);
+}
+
+void ViewFrame::ToggleSlideshow() {
+  if (slideshow_.Running()) return slideshow_.Stop();
+  if (!IsFullScreen()) ToggleFullScreen();
+  slideshow_.Start(place_, list_.size());
+  slideshow_.ShownAt(place_, list_.size());
+}
+
+void ViewFrame::ChooseSlideshow() {
+  slideshow_.Stop();
+  if (slideshow_.Choose(*this)) ToggleSlideshow();
+}
+
+void ViewFrame::ShowInfoWindow() { (new InfoFrame(frame_, this, {list_[place_]}))->Show(); }
+
+void ViewFrame::ToggleOverlay() {
+  overlay_ = !overlay_;
+  ViewChanged();
+}
+
+void ViewFrame::SettingSwitched() {
+  (void)SaveConfiguration();
+  LogEvent("view-look", "profiles=" + std::to_string(settings.ViewModeColorProfiles) +
+                            " checkerboard=" + std::to_string(settings.ViewModeCheckerboard) +
+                            " keepzoom=" + std::to_string(settings.ViewModeKeepZoom));
+  if (!IsCurrent(canvas_->Picture()) && !AskForPicture()) ViewChanged();
+}
+
+void ViewFrame::Leave() {
+  slideshow_.Stop();
+  if (IsFullScreen()) return ToggleFullScreen();
+  if (BrowserPage* browser = frame_.Browser()) browser->FocusName(std::string(platform::FileNameOf(list_[place_])));
+  Close();
+}
+
+void ViewFrame::DeleteFile() {
+  const std::string path = list_[place_];
+  if (!frame_.Files().TrashFromView(this, path)) return;
+  loader_->Forget(path);
+  // A slideshow may have gone on while the user was asked.
+  const auto gone = std::ranges::find(list_, path);
+  if (gone == list_.end()) return;
+  const auto place = static_cast<size_t>(gone - list_.begin());
+  list_.erase(gone);
+  if (place != place_) {
+    if (place < place_) --place_;
+    slideshow_.ShownAt(place_, list_.size());
+    return ViewChanged();
+  }
+  if (list_.empty()) {
+    Close();
+    return;
+  }
+  place_ = std::min(place_, list_.size() - 1);
+  StartAfresh();
+}
+
+// --- turning ---
+
+void ViewFrame::Turn(Orientation turn) {
+  if (saving_ || !IsCurrent(loaded_) || loaded_->picture == nullptr) return wxBell();
+  turn_ = Composed(turn_, turn);
+  note_.clear();
+  LogEvent("view-turned", std::to_string(static_cast<int>(turn_)) + " " + list_[place_]);
+  ShowTurned();
+}
+
+void ViewFrame::SaveTurned() {
+  if (saving_ || turn_ == Orientation::Upright) return SetStatusText("The picture is as its file has it.");
+  const std::string path = list_[place_];
+  const wxWeakRef<ViewFrame> self(this);
+  saving_ = frame_.Files().SaveTurned(path, turn_, [self, path](bool done, const std::string& note) {
+    if (!self) return;
+    self->saving_ = false;
+    if (done) self->FilesChanged();
+    if (self->list_[self->place_] == path) self->note_ = note;
+    self->ViewChanged();
+  });
+  SetStatusText(saving_ ? "Saving..." : "Wait until the files before are done.");
+}
+
+void ViewFrame::FilesChanged() {
+  if (loaded_ == nullptr || saving_ || !loaded_->HasChanged() || !platform::IsRegularFile(list_[place_])) return;
+  loader_->Forget(list_[place_]);
+  loaded_.reset();
+  StartAfresh();
+}
+
+void ViewFrame::Undo() {
+  if (saving_) return wxBell();
+  if (turn_ == Orientation::Upright || loaded_ == nullptr) return frame_.Files().Undo();
+  turn_ = Orientation::Upright;
+  ShowTurned();
+}
+
+void ViewFrame::Redo() { frame_.Files().Redo(); }
+
+void ViewFrame::CopyPicture() {
+  const ViewPicturePointer& shown = canvas_->Picture();
+  if (shown == nullptr || shown->picture == nullptr) return;
+  RgbImage pixels;
+  if (PixelsForOthers(*shown, static_cast<Color>(settings.ViewModeBackground), pixels) != Status::Ok) return wxBell();
+  const wxClipboardLocker clipboard;
+  if (!clipboard || !wxTheClipboard->SetData(new wxBitmapDataObject(BitmapOf(pixels)))) return wxBell();
+  SetStatusText("The picture is on the clipboard.");
+}
+
+// --- keys ---
+
+void ViewFrame::OnKey(wxKeyEvent& event) {
+  const int key = event.GetKeyCode();
+  if (canvas_->PanByKey(key)) return;
+  if (key == WXK_LEFT || key == WXK_UP) return Step(-1);
+  if (key == WXK_RIGHT || key == WXK_DOWN) return Step(1);
+  if (event.ShiftDown() && key == 'S') return ChooseSlideshow();
+  if (event.AltDown() && key == WXK_RETURN) return ShowInfoWindow();
+  if (event.AltDown()) return event.Skip();
+  // Some letters with Ctrl have the numbers of other keys.
+  constexpr int kLettersWithCtrl[] = {'C', 'S', 'Y', 'Z'};
+  const bool letter = std::ranges::find(kLettersWithCtrl, key) != std::end(kLettersWithCtrl);
+  const int typed = !event.ControlDown() ? key : letter ? key - 'A' + WXK_CONTROL_A : 0;
+  if (const KeyCommand<ViewFrame>* command = CommandOfKey(ViewCommands(), typed)) return command->run(*this);
+  event.Skip();
+}
+
+void ViewFrame::ShowMenu(const wxPoint& place) {
+  if (settings.RightClickMenuInView == 0) return;
+  ShowCommandMenu(ViewCommands(), *this, *canvas_, place);
+}
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,85 @@
+#include "desktop/windows/widgets/bitmaps.h"
+
+#include <wx/rawbmp.h>
+#include <wx/settings.h>
+
+#include <cstring>
+#include <string>
+
+namespace fotomill::desktop {
+
+namespace {
+
+struct SymbolShape {
+  std::string_view name;
+  const char* shape;  // drawn in a square of 16 by 16; COLOR is replaced
+};
+
+// Line drawings of one weight.
+constexpr SymbolShape kSymbols[] = {
+    {"back", "<path d='M10 3 L5 8 L10 13'/>"},
+    {"forward", "<path d='M6 3 L11 8 L6 13'/>"},
+    {"up", "<path d='M3 9 L8 4 L13 9 M8 4 V13'/>"},
+    {"below", "<path d='M3.5 6 L8 10.5 L12.5 6'/>"},
+    {"folder", "<path d='M1.5 4 V13 H14.5 V5.5 H8 L6.5 3.5 H2 Z'/>"},
+    {"home", "<path d='M2 8 L8 2.5 L14 8 M3.5 7 V13.5 H12.5 V7 M6.5 13.5 V9.5 H9.5 V13.5'/>"},
+    {"favourite", "<path d='M8 1.8 L9.9 5.9 L14.3 6.4 L11 9.4 L11.9 13.8 L8 11.6 L4.1 13.8 L5 9.4 L1.7 6.4 L6.1 5.9 Z'/>"},
+    {"volume", "<path d='M2 9.5 L3.8 3.5 H12.2 L14 9.5 V13 H2 Z M2 9.5 H14 M11 11.3 H12'/>"},
+    {"view", "<path d='M1 8 C3 4 6 3 8 3 C10 3 13 4 15 8 C13 12 10 13 8 13 C6 13 3 12 1 8 Z'/><circle cx='8' cy='8' r='2.2'/>"},
+    {"slideshow",
+     "<path d='M1.5 2.5 H14.5 V11 H1.5 Z M8 11 V13.5 M5 13.5 H11'/><path d='M6.5 4.7 L10.3 6.8 L6.5 8.9 Z' fill='COLOR'/>"},
+    {"convert", "<path d='M2 5.5 H12 M9.5 3 L12 5.5 L9.5 8 M14 10.5 H4 M6.5 8 L4 10.5 L6.5 13'/>"},
+    {"rename", "<path d='M2 11 L10.5 2.5 L13.5 5.5 L5 14 H2 Z M8.5 4.5 L11.5 7.5'/>"},
+    {"copy", "<path d='M5.5 5.5 H13.5 V14 H5.5 Z M10.5 5.5 V2 H2.5 V10.5 H5.5'/>"},
+    {"move", "<path d='M1.5 4 V13 H14.5 V5.5 H8 L6.5 3.5 H2 Z M5 9.2 H11 M9 7.2 L11 9.2 L9 11.2'/>"},
+    {"trash", "<path d='M2.5 4.5 H13.5 M6 4.5 V2.5 H10 V4.5 M4 4.5 L4.7 14 H11.3 L12 4.5 M6.7 7 V11.5 M9.3 7 V11.5'/>"},
+    {"info", "<circle cx='8' cy='8' r='6.2'/><path d='M8 7.2 V11.5 M8 4.4 V5.4'/>"},
+    {"exif", "<path d='M1.5 4.5 H4.5 L6 2.5 H10 L11.5 4.5 H14.5 V13 H1.5 Z'/><circle cx='8' cy='8.5' r='2.6'/>"},
+    {"setup",
+     "<path d='M2 4.5 H9 M12.5 4.5 H14 M2 11.5 H4 M7.5 11.5 H14'/><circle cx='10.7' cy='4.5' r='1.8'/><circle cx='5.7' cy='11.5' "
+     "r='1.8'/>"},
+    {"history", "<circle cx='8' cy='8' r='6.2'/><path d='M8 4.2 V8 L10.8 9.6'/>"},
+    {"previous", "<path d='M12 3 L5 8 L12 13 Z M3.5 3 V13'/>"},
+    {"next", "<path d='M4 3 L11 8 L4 13 Z M12.5 3 V13'/>"},
+    {"play", "<path d='M4.5 2.5 L12.5 8 L4.5 13.5 Z' fill='COLOR'/>"},
+    {"pause", "<path d='M5 3 V13 M11 3 V13' stroke-width='2.6'/>"},
+};
+
+std::string HexColor(const wxColour& color) { return std::string(color.GetAsString(wxC2S_HTML_SYNTAX).utf8_str()); }
+
+void ReplaceAll(std::string& text, std::string_view from, const std::string& to) {
+  for (size_t at = text.find(from); at != std::string::npos; at = text.find(from, at + to.size())) {
+    text.replace(at, from.size(), to);
+  }
+}
+
+}  // namespace
+
+wxBitmap BitmapOf(const RgbImage& image, double scale) {
+  if (image.Empty()) return {};
+  wxBitmap bitmap(image.width, image.height, 24);
+  wxNativePixelData pixels(bitmap);
+  if (!pixels) return {};
+  wxNativePixelData::Iterator row(pixels);
+  for (int32_t y = 0; y < image.height; ++y) {
+    std::memcpy(row.m_ptr, image.Row(y), static_cast<size_t>(image.width) * 3);
+    row.OffsetY(pixels, 1);
+  }
+  bitmap.SetScaleFactor(scale);
+  return bitmap;
+}
+
+wxBitmapBundle Symbol(std::string_view name, int side) {
+  for (const SymbolShape& symbol : kSymbols) {
+    if (symbol.name != name) continue;
+    std::string svg = std::string(
+                          "<svg xmlns='http://www.w3.org/2000/svg' width='16' height='16' viewBox='0 0 16 16'><g fill='none' "
+                          "stroke='COLOR' stroke-width='1.3' stroke-linecap='round' stroke-linejoin='round'>") +
+                      symbol.shape + "</g></svg>";
+    ReplaceAll(svg, "COLOR", HexColor(wxSystemSettings::GetColour(wxSYS_COLOUR_WINDOWTEXT)));
+    return wxBitmapBundle::FromSVG(svg.c_str(), wxSize(side, side));
+  }
+  return {};
+}
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,23 @@
+#include "desktop/windows/widgets/button_row.h"
+
+#include <wx/button.h>
+
+namespace fotomill::desktop {
+
+wxSizer* BuildButtonRow(wxFrame& frame, wxWindow& panel, std::span<const RowButton> rows) {
+  auto* buttons = new wxBoxSizer(wxHORIZONTAL);
+  for (const RowButton& row : rows) {
+    const bool closes = row.id == wxID_CLOSE;
+    if (closes) buttons->AddStretchSpacer();
+    auto* button = new wxButton(&panel, row.id, row.label);
+    buttons->Add(button, wxSizerFlags().Border(wxRIGHT, closes ? 0 : frame.FromDIP(6)));
+    const auto run = [button, action = row.run](wxCommandEvent&) {
+      if (button->IsEnabled()) action();
+    };
+    frame.Bind(wxEVT_BUTTON, run, row.id);
+    frame.Bind(wxEVT_MENU, run, row.id);
+  }
+  return buttons;
+}
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,112 @@
+#include "desktop/windows/widgets/control_names.h"
+
+#include <wx/app.h>
+#include <wx/button.h>
+#include <wx/checkbox.h>
+#include <wx/choice.h>
+#include <wx/combobox.h>
+#include <wx/dataview.h>
+#include <wx/eventfilter.h>
+#include <wx/listctrl.h>
+#include <wx/radiobox.h>
+#include <wx/radiobut.h>
+#include <wx/scrolwin.h>
+#include <wx/slider.h>
+#include <wx/spinctrl.h>
+#include <wx/splitter.h>
+#include <wx/srchctrl.h>
+#include <wx/stattext.h>
+#include <wx/tglbtn.h>
+#include <wx/toolbar.h>
+#include <wx/treectrl.h>
+#include <wx/treelist.h>
+#include <wx/weakref.h>
+
+#include <algorithm>
+#include <vector>
+
+#include "desktop/windows/shell/screen_reader.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+// Whether a window has a name of its own, not the one that wxWidgets gives to every one of its kind.
+bool HasOwnName(const wxWindow& window) {
+  static const wxString kNamesOfKinds[] = {wxEmptyString,         wxPanelNameStr,    wxControlNameStr,   wxTextCtrlNameStr,
+                                           wxStaticTextNameStr,   wxButtonNameStr,   wxCheckBoxNameStr,  wxRadioButtonNameStr,
+                                           wxRadioBoxNameStr,     wxChoiceNameStr,   wxComboBoxNameStr,  wxListBoxNameStr,
+                                           wxListCtrlNameStr,     wxTreeCtrlNameStr, wxSliderNameStr,    wxSearchCtrlNameStr,
+                                           wxDataViewCtrlNameStr, "wxSpinCtrl",      "wxSpinCtrlDouble", "scrolledWindow"};
+  return std::ranges::find(kNamesOfKinds, window.GetName()) == std::end(kNamesOfKinds);
+}
+
+bool ShowsItsText(wxWindow& window) {
+  return !window.GetLabel().empty() &&
+         (dynamic_cast<wxAnyButton*>(&window) != nullptr || dynamic_cast<wxCheckBox*>(&window) != nullptr ||
+          dynamic_cast<wxRadioButton*>(&window) != nullptr);
+}
+
+wxString PlainText(const wxString& label) {
+  wxString text = wxControl::RemoveMnemonics(label);
+  text.EndsWith(":", &text);
+  return text.Strip(wxString::both);
+}
+
+// The text that was made just before a control, as labels are.
+wxString TextBefore(const wxWindow& window) {
+  const auto* const text = dynamic_cast<wxStaticText*>(window.GetPrevSibling());
+  return text == nullptr ? wxString() : PlainText(text->GetLabel());
+}
+
+// Whether a control is made of windows that no one else sees.
+bool IsComposite(wxWindow* window) {
+  return dynamic_cast<wxListCtrl*>(window) != nullptr || dynamic_cast<wxTreeListCtrl*>(window) != nullptr;
+}
+
+// Empty where the window's own texts say enough, or nothing is known.
+wxString NameOf(wxWindow& window) {
+  if (HasOwnName(window)) return window.GetName();
+  if (IsComposite(window.GetParent())) return NameOf(*window.GetParent());
+  if (ShowsItsText(window) || dynamic_cast<wxControl*>(&window) == nullptr) return {};
+  const wxString before = TextBefore(window);
+  return before.empty() ? window.GetToolTipText().BeforeFirst('\n') : before;
+}
+
+void NameControl(wxWindow& window) {
+  // The buttons of toolbars have names already.
+  if (window.IsTopLevel() || dynamic_cast<wxStaticText*>(&window) != nullptr || dynamic_cast<wxToolBar*>(&window) != nullptr)
+    return;
+  const wxString name = NameOf(window);
+  if (!name.empty()) TellScreenReader(window, name);
+}
+
+// A window that has just come may still be being made, so that its name comes later: it is named when nothing else is to do.
+class Newcomers : public wxEventFilter {
+ public:
+  Newcomers() { wxEvtHandler::AddFilter(this); }
+  ~Newcomers() override { wxEvtHandler::RemoveFilter(this); }
+
+  int FilterEvent(wxEvent& event) override {
+    if (event.GetEventType() != wxEVT_CREATE) return Event_Skip;
+    auto* const window = static_cast<wxWindowCreateEvent&>(event).GetWindow();
+    if (window == nullptr) return Event_Skip;
+    if (waiting_.empty()) wxTheApp->CallAfter([this] { NameAll(); });
+    waiting_.emplace_back(window);
+    return Event_Skip;
+  }
+
+ private:
+  void NameAll() {
+    for (const wxWeakRef<wxWindow>& window : std::exchange(waiting_, {})) {
+      if (window != nullptr && !window->IsBeingDeleted()) NameControl(*window);
+    }
+  }
+  std::vector<wxWeakRef<wxWindow>> waiting_;
+};
+
+}  // namespace
+
+void NameControlsAsTheyCome() { static Newcomers newcomers; }
+
+}  // namespace fotomill::desktop

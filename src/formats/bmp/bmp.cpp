@@ -1,0 +1,519 @@
+// Windows and OS/2 bitmaps (BMP, DIB), little-endian.
+//
+//   offset size  field
+//        0    2  "BM"
+//        2    4  bytes of the file
+//        6    4  reserved, written 0
+//       10    4  offset of the first pixel byte
+//       14    4  header size: 12 for OS/2, written 40 for Windows, where any other value is taken
+//
+//   Windows      field                                   OS/2         field
+//       18    4  width                                       18    2  width
+//       22    4  height; negative: top row first             20    2  height
+//       26    2  planes, written 1                           22    2  planes, written 1
+//       28    2  bits per pixel                              24    2  bits per pixel
+//       30    4  compression, written 0                      26       3-byte palette, then the rows
+//       34    4  bytes of all rows
+//       38    8  two resolutions, written 0
+//       46    8  colours used and important
+//       54       4-byte palette
+//
+// Palette entries are blue, green, red (and 0). Rows run from the bottom up, each padded to 4 bytes; pixels are indices
+// of 1, 4 or 8 bits, or blue, green, red (and alpha).
+//
+// The reader takes compressions 1 (RLE8) and 2 (RLE4); everything else counts as uncompressed. Its peculiarities:
+// - Both dialects need 54 bytes of header. The palette always has 2^bits entries and follows the 40-byte header,
+// whatever
+//   header size and colours used say; OS/2 pixels follow the palette, whatever the pixel offset says.
+// - 16 bits with compression 3: the three masks after the header do not count in the pixel offset, so pixels start 12
+//   bytes after it. Masks of 5-6-5 give blue, green, red; all other 16-bit files are 5-5-5 and give red, green, blue.
+// - A 16-bit file may end within its last row.
+// - Depths without a conversion of their own (2, 12, 64) are copied byte for byte as far as they fit a row.
+// - Run-length data must end with an end-of-bitmap code; pixels outside the picture are dropped.
+//
+// The writer stores uncompressed rows, 32-bit ones when there is an alpha plane; OS/2 files have no alpha.
+// Source: Microsoft, "BITMAPINFOHEADER structure" and "Bitmap Compression", Windows GDI reference; IBM, OS/2 2.0
+// "Presentation Manager Programming Reference", bitmap file format.
+#include "formats/bmp/bmp.h"
+
+#include <algorithm>
+#include <cstring>
+#include <limits>
+
+#include "core/byte_reader.h"
+#include "core/byte_writer.h"
+#include "core/checked.h"
+#include "core/text.h"
+#include "platform/file_view.h"
+#include "processing/pixel_rows.h"
+#include "settings/settings.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr uint64_t kHeaderSize = 54;  // both headers of the Windows dialect; OS/2 files need as many bytes
+constexpr uint64_t kOs2HeaderSize = 26;
+constexpr uint32_t kOs2InfoSize = 12;
+constexpr uint32_t kWindowsInfoSize = 40;
+constexpr uint64_t kMasksSize = 12;
+constexpr uint64_t kChunkSize = 16 << 20;  // rows are read and written in pieces of about this many bytes
+
+constexpr uint32_t kRle8 = 1, kRle4 = 2, kBitFields = 3;
+
+struct BmpHeader {
+  uint32_t fileSize = 0;  // as the file claims
+  uint32_t pixelOffset = 0;
+  uint32_t infoSize = 0;  // size of the second header
+  int32_t width = 0;
+  int32_t height = 0;  // negative: top row first
+  uint16_t planes = 0;
+  uint16_t bits = 0;  // of the file, any value
+  uint32_t compression = 0;
+  uint32_t imageBytes = 0;
+  uint32_t resolutionX = 0, resolutionY = 0;  // pixels per metre
+  uint32_t colorsUsed = 0, colorsImportant = 0;
+
+  bool IsOs2() const { return infoSize == kOs2InfoSize; }
+  // Whether other programs may find other colours in it: the writer's forms leave no doubt.
+  bool IsPeculiar() const { return (!IsOs2() && infoSize != kWindowsInfoSize) || bits == 16 || (bits > 8 && compression != 0); }
+  bool TopDown() const { return height < 0; }
+  // The number of rows, 0 when it is more than a height can say.
+  int32_t Rows() const { return height == std::numeric_limits<int32_t>::min() ? 0 : std::abs(height); }
+  // The depth of the picture: what the file says up to 8, else 24.
+  int32_t Depth() const { return bits > 8 ? 24 : bits; }
+  uint64_t FileStride() const { return RowStride(width, bits); }
+  uint64_t PaletteOffset() const { return IsOs2() ? kOs2HeaderSize : kHeaderSize; }
+  uint64_t PaletteEntrySize() const { return IsOs2() ? 3 : 4; }
+  uint64_t PaletteSize() const { return bits > 8 ? 0 : (uint64_t{1} << bits) * PaletteEntrySize(); }
+  bool HasMasks() const { return compression == kBitFields && bits == 16; }
+  uint64_t PixelOffset() const { return IsOs2() ? PaletteOffset() + PaletteSize() : pixelOffset + (HasMasks() ? kMasksSize : 0); }
+};
+
+// Ok, or DamagedFile without the signature or a whole header.
+Status ParseHeader(std::span<const uint8_t> file, BmpHeader& header) {
+  ByteReader bytes(file.first(std::min<size_t>(file.size(), kHeaderSize)));
+  const bool signature = bytes.Match("BM");
+  header.fileSize = bytes.Le32();
+  bytes.Skip(4);
+  header.pixelOffset = bytes.Le32();
+  header.infoSize = bytes.Le32();
+  if (header.IsOs2()) {
+    header.width = bytes.Le16();
+    header.height = bytes.Le16();
+    header.planes = bytes.Le16();
+    header.bits = bytes.Le16();
+    bytes.Seek(kHeaderSize);
+  } else {
+    header.width = static_cast<int32_t>(bytes.Le32());
+    header.height = static_cast<int32_t>(bytes.Le32());
+    header.planes = bytes.Le16();
+    header.bits = bytes.Le16();
+    header.compression = bytes.Le32();
+    header.imageBytes = bytes.Le32();
+    header.resolutionX = bytes.Le32();
+    header.resolutionY = bytes.Le32();
+    header.colorsUsed = bytes.Le32();
+    header.colorsImportant = bytes.Le32();
+  }
+  return signature && bytes.Ok() ? Status::Ok : Status::DamagedFile;
+}
+
+// Fills `palette` for the header's depth from the head of the file. Entries that the file does not hold stay as they
+// are in the black and white palette.
+void ReadPalette(std::span<const uint8_t> file, const BmpHeader& header, Palette& palette) {
+  MakeDefaultPalette(&palette, nullptr, header.bits > 8 ? kDisplayPalette : kBlackAndWhitePalette);
+  const uint64_t begin = std::min<uint64_t>(header.PaletteOffset(), file.size());
+  const uint64_t size = std::min<uint64_t>(header.PaletteSize(), file.size() - begin);
+  ByteReader bytes(file.subspan(begin, size));
+  for (size_t i = 0; bytes.Left() >= header.PaletteEntrySize(); i += 3) {
+    const std::span<const uint8_t> entry = bytes.Take(header.PaletteEntrySize());
+    palette[i] = entry[2];
+    palette[i + 1] = entry[1];
+    palette[i + 2] = entry[0];
+  }
+}
+
+// Fills the record's facts from the head of the file. DamagedFile when the header leaves nothing to decode.
+Status DescribePicture(const platform::FileView& file, const BmpHeader& header, PictureRecord& picture) {
+  if (header.width < 1 || header.Rows() < 1 || header.bits < 1) return Status::DamagedFile;
+  picture.typeName.AssignCut(header.IsOs2() ? "OS/2 bitmap" : "Windows bitmap");
+  picture.width = header.width;
+  picture.height = header.Rows();
+  picture.bitsPerPixel = header.Depth();
+  picture.simplified = header.IsPeculiar();
+  picture.imageBytes = EstimateImageBytes(picture.width, picture.height, picture.bitsPerPixel);
+  picture.alphaFlags = static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (header.bits > 24 ? kHasAlpha : 0));
+  ReadPalette(file.Bytes(), header, picture.palette);
+  return Status::Ok;
+}
+
+// What one row becomes. `source` is a row of the file, which may be short only where the reader allows it; `row` a row
+// of the picture and `alpha` one of its alpha plane (empty without one), padding included. Writes all of `row`.
+using RowReader = void (*)(std::span<const uint8_t> source, int32_t width, std::span<uint8_t> row, std::span<uint8_t> alpha);
+
+void CopyRow(std::span<const uint8_t> source, int32_t, std::span<uint8_t> row, std::span<uint8_t>) {
+  const size_t count = std::min(source.size(), row.size());
+  std::memcpy(row.data(), source.data(), count);
+  std::memset(row.data() + count, 0, row.size() - count);
+}
+
+// Calls `spread(pixel, place)` for each whole 16-bit pixel of a row.
+template <typename Spread>
+void ReadRow16(std::span<const uint8_t> source, int32_t width, std::span<uint8_t> row, Spread spread) {
+  const size_t count = std::min<size_t>(source.size() / 2, width);
+  for (size_t x = 0; x < count; ++x) {
+    spread(static_cast<uint32_t>(source[2 * x] | source[2 * x + 1] << 8), row.data() + 3 * x);
+  }
+  std::memset(row.data() + 3 * count, 0, row.size() - 3 * count);
+}
+
+void ReadRow565(std::span<const uint8_t> source, int32_t width, std::span<uint8_t> row, std::span<uint8_t>) {
+  ReadRow16(source, width, row, [](uint32_t pixel, uint8_t* place) {
+    place[0] = static_cast<uint8_t>((pixel & 31) * 8);
+    place[1] = static_cast<uint8_t>((pixel >> 5 & 63) * 4);
+    place[2] = static_cast<uint8_t>((pixel >> 11) * 8);
+  });
+}
+
+// Red comes first here, other than in all other rows: files read so since the format's first support, and stay so.
+void ReadRow555(std::span<const uint8_t> source, int32_t width, std::span<uint8_t> row, std::span<uint8_t>) {
+  ReadRow16(source, width, row, [](uint32_t pixel, uint8_t* place) {
+    place[0] = static_cast<uint8_t>((pixel >> 10 & 31) * 8);
+    place[1] = static_cast<uint8_t>((pixel >> 5 & 31) * 8);
+    place[2] = static_cast<uint8_t>((pixel & 31) * 8);
+  });
+}
+
+void ReadRow32(std::span<const uint8_t> source, int32_t width, std::span<uint8_t> row, std::span<uint8_t>) {
+  const size_t count = static_cast<size_t>(width);
+  DropFourth(source.data(), count, row.data());
+  std::memset(row.data() + 3 * count, 0, row.size() - 3 * count);
+}
+
+void ReadRow32Alpha(std::span<const uint8_t> source, int32_t width, std::span<uint8_t> row, std::span<uint8_t> alpha) {
+  const size_t count = static_cast<size_t>(width);
+  SplitAlpha(source.data(), count, row.data(), alpha.data());
+  std::memset(row.data() + 3 * count, 0, row.size() - 3 * count);
+}
+
+// Whether the masks after the header are those of 5-6-5 pixels. FileReadError when the file ends within them.
+Status ReadMasks(std::span<const uint8_t> file, bool& is565) {
+  ByteReader bytes(file);
+  bytes.Seek(kHeaderSize);
+  const uint32_t red = bytes.Le32(), green = bytes.Le32(), blue = bytes.Le32();
+  is565 = red == 0xF800 && green == 0x07E0 && blue == 0x001F;
+  return bytes.Ok() ? Status::Ok : Status::FileReadError;
+}
+
+Status ChooseRowReader(const platform::FileView& file, const BmpHeader& header, const PackedImage& alpha, RowReader& reader) {
+  reader = CopyRow;
+  if (header.bits == 16) {
+    bool is565 = false;
+    if (header.HasMasks()) RETURN_IF_BAD(ReadMasks(file.Bytes(), is565));
+    reader = is565 ? ReadRow565 : ReadRow555;
+  } else if (header.bits == 32) {
+    reader = alpha.Empty() ? ReadRow32 : ReadRow32Alpha;
+  }
+  return Status::Ok;
+}
+
+// FileReadError when the file has no room for its rows. The last row of 16-bit pixels may be short.
+Status CheckRowsFit(const platform::FileView& file, const BmpHeader& header) {
+  const uint64_t rows = static_cast<uint64_t>(header.Rows()) - (header.bits == 16 ? 1 : 0);
+  uint64_t size = 0, end = 0;
+  const bool counted = CheckedMultiply(header.FileStride(), rows, size) && CheckedAdd(size, header.PixelOffset(), end);
+  return counted && end <= file.FileSize() ? Status::Ok : Status::FileReadError;
+}
+
+int32_t RowsPerChunk(uint64_t stride) { return static_cast<int32_t>(std::max<uint64_t>(kChunkSize / stride, 1)); }
+
+// Rows that lie in the file as in the picture go straight into it.
+Status ReadRowsUnchanged(const platform::FileView& file, const BmpHeader& header, const PictureRecord& picture,
+                         PackedImage& image) {
+  const int32_t height = image.Height();
+  const uint64_t stride = image.Stride();
+  const int32_t step = header.TopDown() ? 1 : RowsPerChunk(stride);
+  for (int32_t r = 0; r < height; r += step) {
+    const int32_t count = std::min(step, height - r);
+    const uint64_t place = static_cast<uint64_t>(header.TopDown() ? height - 1 - r : r) * stride;
+    const std::span<uint8_t> rows = image.Rows().subspan(place, static_cast<uint64_t>(count) * stride);
+    if (!file.ReadAt(header.PixelOffset() + static_cast<uint64_t>(r) * stride, rows)) return Status::FileReadError;
+    for (int32_t i = 0; i < count; ++i) picture.ReportRow(r + i);
+  }
+  return Status::Ok;
+}
+
+Status ReadRowsConverted(platform::FileView& file, const BmpHeader& header, const PictureRecord& picture, RowReader readRow,
+                         PackedImage& image, PackedImage& alpha) {
+  const int32_t height = image.Height();
+  const uint64_t stride = header.FileStride();
+  for (int32_t r = 0; r < height; ++r) {
+    const uint64_t offset = header.PixelOffset() + static_cast<uint64_t>(r) * stride;
+    const std::span<const uint8_t> source = file.Bytes().subspan(offset, std::min(stride, file.FileSize() - offset));
+    const int32_t stored = header.TopDown() ? height - 1 - r : r;
+    readRow(source, header.width, image.StoredRow(stored), alpha.Empty() ? std::span<uint8_t>() : alpha.StoredRow(stored));
+    file.DropBefore(offset);
+    picture.ReportRow(r);
+  }
+  return file.Intact() ? Status::Ok : Status::FileReadError;
+}
+
+// Pixels of 8 bits: a run repeats one index, a literal holds one index a byte.
+struct Rle8 {
+  static constexpr uint64_t kPixelsPerByte = 1;
+  static void Run(uint8_t* row, uint64_t x, uint64_t count, uint8_t value) { std::memset(row + x, value, count); }
+  static void Literal(uint8_t* row, uint64_t x, uint64_t count, const uint8_t* data) { std::memcpy(row + x, data, count); }
+};
+
+// Pixels of 4 bits: a run alternates between the high and the low half of its value.
+struct Rle4 {
+  static constexpr uint64_t kPixelsPerByte = 2;
+  static void Put(uint8_t* row, uint64_t x, uint8_t half) {
+    uint8_t& place = row[x / 2];
+    place = static_cast<uint8_t>(x % 2 == 0 ? (place & 0x0F) | half << 4 : (place & 0xF0) | half);
+  }
+  static void Run(uint8_t* row, uint64_t x, uint64_t count, uint8_t value) {
+    for (uint64_t i = 0; i < count; ++i) Put(row, x + i, i % 2 == 0 ? value >> 4 : value & 0x0F);
+  }
+  static void Literal(uint8_t* row, uint64_t x, uint64_t count, const uint8_t* data) {
+    for (uint64_t i = 0; i < count; ++i) Put(row, x + i, i % 2 == 0 ? data[i / 2] >> 4 : data[i / 2] & 0x0F);
+  }
+};
+
+// Decodes run-length data into the zero-filled rows of `image`, whatever its depth, as far as they fit. Tokens:
+//
+//   n v            n pixels of value v
+//   0 0            end of line           0 1          end of bitmap
+//   0 2 dx dy      move right and up     0 n data...  n pixels as they stand (n from 3), padded to an even size
+//
+// FileReadError when the data end before an end of bitmap.
+template <typename Kind>
+Status DecodeRunLength(platform::FileView& file, const BmpHeader& header, const PictureRecord& picture, PackedImage& image) {
+  const int32_t height = image.Height();
+  const uint64_t limit = std::min<uint64_t>(header.width, image.Stride() * Kind::kPixelsPerByte);
+  ByteReader bytes(file.Bytes());
+  bytes.Seek(header.PixelOffset());
+  uint64_t x = 0, y = 0;
+  // How many of `count` pixels at (x, y) lie in the picture, and where the row begins.
+  const auto inside = [&](uint64_t count) { return y < uint64_t(height) && x < limit ? std::min(count, limit - x) : 0; };
+  const auto row = [&] { return image.StoredRow(static_cast<int32_t>(header.TopDown() ? height - 1 - y : y)).data(); };
+  while (bytes.Left() >= 2) {
+    const uint8_t count = bytes.U8(), code = bytes.U8();
+    if (count > 0) {
+      if (const uint64_t visible = inside(count)) Kind::Run(row(), x, visible, code);
+      x += count;
+    } else if (code == 0) {
+      x = 0;
+      ++y;
+      file.DropBefore(bytes.Position());
+      picture.ReportRow(static_cast<int32_t>(std::min<uint64_t>(y, height)));
+    } else if (code == 1) {
+      return file.Intact() ? Status::Ok : Status::FileReadError;
+    } else if (code == 2) {
+      x += bytes.U8();
+      y += bytes.U8();
+    } else {
+      const uint64_t size = (code + 2 * Kind::kPixelsPerByte - 1) / (2 * Kind::kPixelsPerByte) * 2;
+      const std::span<const uint8_t> data = bytes.Take(size);
+      if (!bytes.Ok()) break;
+      if (const uint64_t visible = inside(code)) Kind::Literal(row(), x, visible, data.data());
+      x += code;
+    }
+  }
+  return Status::FileReadError;
+}
+
+// What the writer stores for a picture.
+struct BmpLayout {
+  bool os2 = false;
+  bool alpha = false;
+  int32_t width = 0, height = 0;
+  int32_t bits = 0;     // 1, 4, 8, 24, or 32 with alpha
+  uint32_t colors = 0;  // palette entries
+  uint32_t pixelOffset = 0;
+  uint32_t rowBytes = 0;  // all rows
+  uint32_t fileSize = 0;
+};
+
+// UnsuitableImage when a size does not fit its field.
+Status ChooseLayout(const PictureRecord& picture, BmpLayout& layout) {
+  const PackedImage& image = picture.image;
+  layout.os2 = settings.WriteOS2Bitmaps != 0;
+  layout.alpha =
+      !layout.os2 && image.Bits() == 24 && picture.alpha.Width() == image.Width() && picture.alpha.Height() == image.Height();
+  layout.width = image.Width();
+  layout.height = image.Height();
+  layout.bits = layout.alpha ? 32 : image.Bits();
+  layout.colors = static_cast<uint32_t>(image.Colors());
+  layout.pixelOffset = static_cast<uint32_t>(layout.os2 ? kOs2HeaderSize + 3 * layout.colors : kHeaderSize + 4 * layout.colors);
+  const uint64_t rowBytes = RowStride(layout.width, layout.bits) * static_cast<uint64_t>(layout.height);
+  if (rowBytes > UINT32_MAX - layout.pixelOffset) return Status::UnsuitableImage;
+  if (layout.os2 && (layout.width > UINT16_MAX || layout.height > UINT16_MAX)) return Status::UnsuitableImage;
+  layout.rowBytes = static_cast<uint32_t>(rowBytes);
+  layout.fileSize = layout.rowBytes + layout.pixelOffset;
+  return Status::Ok;
+}
+
+void WriteHeader(ByteWriter& out, const BmpLayout& layout) {
+  out.Text("BM");
+  out.Le32(layout.fileSize);
+  out.Le32(0);
+  out.Le32(layout.pixelOffset);
+  if (layout.os2) {
+    out.Le32(kOs2InfoSize);
+    out.Le16(static_cast<uint16_t>(layout.width));
+    out.Le16(static_cast<uint16_t>(layout.height));
+    out.Le16(1);
+    out.Le16(static_cast<uint16_t>(layout.bits));
+    return;
+  }
+  out.Le32(kWindowsInfoSize);
+  out.Le32(static_cast<uint32_t>(layout.width));
+  out.Le32(static_cast<uint32_t>(layout.height));
+  out.Le16(1);
+  out.Le16(static_cast<uint16_t>(layout.bits));
+  out.Le32(0);
+  out.Le32(layout.rowBytes);
+  out.Zeros(8);
+  out.Le32(layout.colors);
+  out.Le32(layout.colors);
+}
+
+void WritePalette(ByteWriter& out, const BmpLayout& layout, const Palette& palette) {
+  for (uint32_t i = 0; i < 3 * layout.colors; i += 3) {
+    out.U8(palette[i + 2]);
+    out.U8(palette[i + 1]);
+    out.U8(palette[i]);
+    if (!layout.os2) out.U8(0);
+  }
+}
+
+void WriteRowsUnchanged(ByteWriter& out, const PictureRecord& picture) {
+  const PackedImage& image = picture.image;
+  const int32_t step = RowsPerChunk(image.Stride());
+  for (int32_t r = 0; r < image.Height() && !out.Failed(); r += step) {
+    const int32_t count = std::min(step, image.Height() - r);
+    for (int32_t i = 0; i < count; ++i) picture.ReportRow(r + i);
+    out.Bytes(image.Rows().subspan(static_cast<uint64_t>(r) * image.Stride(), static_cast<uint64_t>(count) * image.Stride()));
+  }
+}
+
+void WriteRowsWithAlpha(ByteWriter& out, const PictureRecord& picture) {
+  constexpr int32_t kPiece = ByteWriter::kMostReserved / 4;  // pixels
+  const int32_t width = picture.image.Width();
+  for (int32_t r = 0; r < picture.image.Height() && !out.Failed(); ++r) {
+    picture.ReportRow(r);
+    const uint8_t* color = picture.image.StoredRow(r).data();
+    const uint8_t* alpha = picture.alpha.StoredRow(r).data();
+    for (int32_t x = 0; x < width; x += kPiece) {
+      const int32_t end = std::min(x + kPiece, width);
+      const size_t count = static_cast<size_t>(end - x);
+      MergeAlpha(color + 3 * x, alpha + x, count, out.Reserve(4 * count));
+      out.Used(4 * count);
+    }
+  }
+}
+
+// A number of a header with a comma between every group of three digits.
+std::string Number(int64_t number) {
+  std::string text(number < 0 ? "-" : "");
+  text += WithThousands(static_cast<uint64_t>(std::abs(number)));
+  return text;
+}
+
+}  // namespace
+
+Status BmpInfo(PictureRecord& picture, const char* fileName, uint32_t) {
+  picture.typeName.Clear();
+  platform::FileView file;
+  if (!file.OpenHead(fileName, kHeaderSize + 1024)) return Status::FileOpenError;
+  picture.fileSize = file.FileSize();
+  BmpHeader header;
+  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
+  return DescribePicture(file, header, picture);
+}
+
+Status BmpRead(PictureRecord& picture, const char* fileName) {
+  const ProgressScope progress(picture);
+  picture.image.Free();
+  picture.alpha.Free();
+  platform::FileView file;
+  if (!file.Open(fileName)) return Status::FileOpenError;
+  if (file.FileSize() < kHeaderSize) return Status::FileReadError;
+  BmpHeader header;
+  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
+  RETURN_IF_BAD(DescribePicture(file, header, picture));
+
+  const bool runLength = header.compression == kRle8 || header.compression == kRle4;
+  if (header.PixelOffset() > file.FileSize()) return Status::FileReadError;
+  if (!runLength) RETURN_IF_BAD(CheckRowsFit(file, header));
+
+  PackedImage image, alpha;
+  RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette, picture.bitsPerPixel, image,
+                               runLength ? platform::Fill::Zero : platform::Fill::Unset));
+  if (header.bits > 24 && settings.UseAlphaChannels != 0) {
+    RETURN_IF_BAD(NewAlphaPlane(picture.width, picture.height, alpha));
+  }
+
+  if (header.compression == kRle8) {
+    RETURN_IF_BAD(DecodeRunLength<Rle8>(file, header, picture, image));
+  } else if (header.compression == kRle4) {
+    RETURN_IF_BAD(DecodeRunLength<Rle4>(file, header, picture, image));
+  } else if (header.bits == image.Bits()) {
+    RETURN_IF_BAD(ReadRowsUnchanged(file, header, picture, image));
+  } else {
+    RowReader reader = nullptr;
+    RETURN_IF_BAD(ChooseRowReader(file, header, alpha, reader));
+    RETURN_IF_BAD(ReadRowsConverted(file, header, picture, reader, image, alpha));
+  }
+  picture.image = std::move(image);
+  picture.alpha = std::move(alpha);
+  return Status::Ok;
+}
+
+Status BmpWrite(PictureRecord& picture, const WriteOptions& options) {
+  const ProgressScope progress(picture);
+  if (picture.image.Empty()) return Status::MemoryAllocationError;
+  BmpLayout layout;
+  RETURN_IF_BAD(ChooseLayout(picture, layout));
+  ByteWriter out;
+  if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
+  WriteHeader(out, layout);
+  WritePalette(out, layout, picture.palette);
+  if (layout.alpha) {
+    WriteRowsWithAlpha(out, picture);
+  } else {
+    WriteRowsUnchanged(out, picture);
+  }
+  return CommitOutput(out, options);
+}
+
+Status BmpDetails(PictureRecord& picture) {
+  picture.detailLines.Clear();
+  platform::FileView file;
+  if (!file.OpenHead(picture.fileName.c_str(), kHeaderSize)) return Status::FileOpenError;
+  picture.fileSize = file.FileSize();
+  MakeDefaultPalette(&picture.palette, nullptr, kBlackAndWhitePalette);
+  BmpHeader header;
+  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
+  DetailLines& lines = picture.detailLines;
+  lines.Add(header.IsOs2() ? "OS/2 BITMAP" : "WINDOWS BITMAP");
+  lines.AddFormat("            File size: %s", Number(header.fileSize).c_str());
+  lines.AddFormat("          Header size: %u", header.pixelOffset);
+  lines.AddFormat("            Info size: %u", header.infoSize);
+  lines.AddFormat("                Width: %s", Number(header.width).c_str());
+  lines.AddFormat("                Depth: %s", Number(header.height).c_str());
+  lines.AddFormat("               Planes: %u", header.planes);
+  lines.AddFormat("                 Bits: %u", header.bits);
+  if (header.IsOs2()) return Status::Ok;
+  lines.AddFormat("          Compression: %u", header.compression);
+  lines.AddFormat("           Image size: %s", Number(header.imageBytes).c_str());
+  lines.AddFormat("Horizontal resolution: %u", header.resolutionX);
+  lines.AddFormat("  Vertical resolution: %u", header.resolutionY);
+  lines.AddFormat("          Colors used: %s", Number(header.colorsUsed).c_str());
+  lines.AddFormat("     Colors important: %s", Number(header.colorsImportant).c_str());
+  return Status::Ok;
+}
+
+}  // namespace fotomill

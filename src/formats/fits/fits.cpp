@@ -1,0 +1,296 @@
+// Flexible Image Transport System (FITS): a header of text cards, then the values of one grey picture, big-endian.
+//
+//   offset size  content
+//        0   80  a card: keyword of up to 8 characters, "=" in column 9, value; the first keyword is SIMPLE
+//       80   80  ...
+//        .   80  the last card, END
+//        .    .  from the next multiple of 2880: NAXIS2 rows, the top one first, of NAXIS1 values of |BITPIX| bits
+//        .    .  zeros up to a multiple of 2880
+//
+// Reads a card as its keyword up to the first blank or "=", then its value behind all blanks and "="; a repeated
+// keyword counts as it stands last. Of more than two axes the first plane is read. The picture shows the first bytes of
+// each row as they are in the file, one byte a pixel, through a grey palette: values wider than a byte show as their
+// single bytes, and BSCALE and BZERO change nothing.
+//
+// Writes eleven cards and one byte of grey per pixel.
+//
+// Source: IAU FITS Working Group, "Definition of the Flexible Image Transport System (FITS)", version 4.0 (2018).
+#include "formats/fits/fits.h"
+
+#include <algorithm>
+#include <array>
+#include <cstring>
+#include <string>
+#include <string_view>
+
+#include "core/byte_reader.h"
+#include "core/byte_writer.h"
+#include "core/checked.h"
+#include "core/creator.h"
+#include "core/limits.h"
+#include "core/text.h"
+#include "platform/file_view.h"
+#include "processing/pixel_rows.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr uint64_t kCardBytes = 80;
+constexpr uint64_t kBlockBytes = 2880;
+constexpr std::string_view kSignature = "SIMPLE";
+constexpr size_t kKeywordBytes = 8;
+constexpr size_t kValueBytes = 21;
+constexpr size_t kMostDetailLines = 32;
+
+struct FitsCard {
+  std::string_view keyword;
+  std::string_view value;  // with the blanks behind it
+};
+
+struct FitsHeader {
+  int64_t bitsPerValue = 1;  // BITPIX without its sign; these numbers are as the file claims until CheckHeader
+  int64_t axes = 0;
+  int64_t width = 0;
+  int64_t height = 0;
+  bool ended = false;       // END was met
+  uint64_t dataOffset = 0;  // where the values begin
+
+  uint64_t RowBytes() const { return static_cast<uint64_t>(width * (bitsPerValue / 8)); }
+};
+
+FitsCard ParseCard(std::span<const uint8_t> bytes) {
+  constexpr std::string_view kSeparators = " =";
+  const std::string_view text(reinterpret_cast<const char*>(bytes.data()), bytes.size());
+  const size_t keywordEnd = std::min(text.find_first_of(kSeparators), text.size());
+  const size_t valueStart = std::min(text.find_first_not_of(kSeparators, keywordEnd), text.size());
+  return {text.substr(0, keywordEnd), text.substr(valueStart)};
+}
+
+// The next card. False when the data end first, or the header is longer than any real one.
+bool NextCard(ByteReader& bytes, FitsCard& card) {
+  if (bytes.Position() >= limits.fitsCards * kCardBytes) return false;
+  const auto cardBytes = bytes.Take(kCardBytes);
+  if (!bytes.Ok()) return false;
+  card = ParseCard(cardBytes);
+  return true;
+}
+
+FitsHeader ParseHeader(std::span<const uint8_t> fileBytes) {
+  FitsHeader header;
+  ByteReader bytes(fileBytes);
+  FitsCard card;
+  while (!header.ended && NextCard(bytes, card)) {
+    if (card.keyword == "BITPIX") header.bitsPerValue = LeadingInteger(card.value);
+    if (card.keyword == "NAXIS") header.axes = LeadingInteger(card.value);
+    if (card.keyword == "NAXIS1") header.width = LeadingInteger(card.value);
+    if (card.keyword == "NAXIS2") header.height = LeadingInteger(card.value);
+    header.ended = card.keyword == "END";
+  }
+  if (header.bitsPerValue < 0) header.bitsPerValue = -std::max(header.bitsPerValue, -INT64_MAX);
+  header.dataOffset = (bytes.Position() + kBlockBytes - 1) / kBlockBytes * kBlockBytes;
+  return header;
+}
+
+// Ok; NoImages without a width or height; DamagedFile when a number is negative or absurd, or a value has no
+// whole byte.
+Status CheckHeader(const FitsHeader& header) {
+  if (header.width == 0 || header.height == 0) return Status::NoImages;
+  for (const int64_t number : {header.axes, header.width, header.height, header.bitsPerValue}) {
+    if (number < 0 || number > INT32_MAX) return Status::DamagedFile;
+  }
+  return header.bitsPerValue < 8 ? Status::DamagedFile : Status::Ok;
+}
+
+// As much of a row of the file as fits the row of the picture, which may take in bytes beyond its pixels.
+void CopyRow(std::span<const uint8_t> fileRow, std::span<uint8_t> row) {
+  const size_t count = std::min(fileRow.size(), row.size());
+  std::memcpy(row.data(), fileRow.data(), count);
+  std::memset(row.data() + count, 0, row.size() - count);
+}
+
+// So many hundredths of a level, rounded down. A product and a shift in place of a division: compilers do that for many
+// levels at once.
+constexpr uint32_t Share(uint8_t level, uint32_t hundredths) { return level * ((hundredths * 65536 + 99) / 100) >> 16; }
+
+// Each channel's share is rounded for itself.
+constexpr uint32_t kRed = 30, kGreen = 59, kBlue = 11;
+constexpr uint8_t GreyOf(uint8_t red, uint8_t green, uint8_t blue) {
+  return static_cast<uint8_t>(Share(red, kRed) + Share(green, kGreen) + Share(blue, kBlue));
+}
+static_assert([] {
+  for (uint32_t level = 0; level < 256; ++level) {
+    for (const uint32_t hundredths : {kRed, kGreen, kBlue}) {
+      if (Share(static_cast<uint8_t>(level), hundredths) != level * hundredths / 100) return false;
+    }
+  }
+  return true;
+}());
+
+using GreyTable = std::array<uint8_t, 256>;
+
+// The greys of a picture's palette; entries that its depth cannot name are black.
+GreyTable PaletteGreys(const PictureRecord& picture) {
+  GreyTable greys{};
+  const int32_t depth = std::clamp(picture.bitsPerPixel, 1, 8);
+  for (size_t i = 0; i < size_t{1} << depth; ++i) {
+    const uint8_t* color = picture.palette.data() + 3 * i;
+    greys[i] = GreyOf(color[0], color[1], color[2]);
+  }
+  return greys;
+}
+
+// Turn `count` pixels, of which the first is the first of a byte, into grey.
+void GreyBits(const uint8_t* pixels, const GreyTable&, size_t count, uint8_t* out) {
+  for (size_t x = 0; x < count; ++x) out[x] = (pixels[x / 8] << x % 8 & 0x80) != 0 ? 255 : 0;
+}
+
+void GreyNibbles(const uint8_t* pixels, const GreyTable& greys, size_t count, uint8_t* out) {
+  for (size_t x = 0; x < count; ++x) out[x] = greys[pixels[x / 2] >> (x % 2 == 0 ? 4 : 0) & 15];
+}
+
+void GreyBytes(const uint8_t* pixels, const GreyTable& greys, size_t count, uint8_t* out) {
+  for (size_t x = 0; x < count; ++x) out[x] = greys[pixels[x]];
+}
+
+void GreyColors(const uint8_t* pixels, const GreyTable&, size_t count, uint8_t* out) {
+  constexpr size_t kPiece = 1024;  // the formula runs over planes, which compilers turn into vectors
+  uint8_t blue[kPiece], green[kPiece], red[kPiece];
+  for (size_t begin = 0; begin < count; begin += kPiece) {
+    const size_t size = std::min(count - begin, kPiece);
+    SplitColors(pixels + 3 * begin, size, blue, green, red);
+    for (size_t x = 0; x < size; ++x) out[begin + x] = GreyOf(red[x], green[x], blue[x]);
+  }
+}
+
+using GreyPixels = void (*)(const uint8_t*, const GreyTable&, size_t, uint8_t*);
+GreyPixels GreyPixelsFor(int32_t bits) {
+  if (bits == 1) return GreyBits;
+  if (bits == 4) return GreyNibbles;
+  return bits == 8 ? GreyBytes : GreyColors;
+}
+
+void WriteCard(ByteWriter& out, std::string_view keyword, std::string_view value = {}) {
+  std::array<char, kCardBytes> card;
+  card.fill(' ');
+  keyword.copy(card.data(), kKeywordBytes);
+  if (!value.empty()) {
+    value = value.substr(0, kValueBytes);
+    card[kKeywordBytes] = '=';
+    value.copy(card.data() + kKeywordBytes + 1 + kValueBytes - value.size(), value.size());
+  }
+  out.Text({card.data(), card.size()});
+}
+
+void WriteHeader(ByteWriter& out, const PackedImage& image) {
+  WriteCard(out, "SIMPLE", "T");
+  WriteCard(out, "BITPIX", "8");
+  WriteCard(out, "NAXIS", "2");
+  WriteCard(out, "NAXIS1", std::to_string(image.Width()));
+  WriteCard(out, "NAXIS2", std::to_string(image.Height()));
+  WriteCard(out, "ORIGIN", kCreator);
+  WriteCard(out, "BSCALE", "1.0000000E+00");
+  WriteCard(out, "BZERO", "0.0000000E+00");
+  WriteCard(out, "DATAMIN", "0.0000000E+00");
+  WriteCard(out, "DATAMAX", "255.0000000E+00");
+  WriteCard(out, "END");
+  while (out.Position() < kBlockBytes) WriteCard(out, "");
+}
+
+// Parses the header and fills the record's facts.
+Status DescribePicture(const platform::FileView& file, PictureRecord& picture, FitsHeader& header) {
+  picture.typeName.Clear();
+  picture.fileSize = file.FileSize();
+  header = ParseHeader(file.Bytes());
+  RETURN_IF_BAD(CheckHeader(header));
+  picture.width = static_cast<int32_t>(header.width);
+  picture.height = static_cast<int32_t>(header.height);
+  picture.bitsPerPixel = 8;
+  picture.simplified = header.bitsPerValue > 8 || header.axes > 2;
+  picture.imageBytes = EstimateImageBytes(picture.width, picture.height, 8);
+  picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
+  picture.palette = GreyRamp();
+  picture.typeName.AssignCut(std::to_string(header.axes) + " axis - " + std::to_string(header.bitsPerValue) + " bits of grey");
+  return Status::Ok;
+}
+
+// Ok, or FileReadError when the header has no end or the file no room for its rows.
+Status CheckRowsFit(const platform::FileView& file, const FitsHeader& header) {
+  uint64_t size = 0, end = 0;
+  const bool counted =
+      CheckedMultiply(header.RowBytes(), static_cast<uint64_t>(header.height), size) && CheckedAdd(size, header.dataOffset, end);
+  return header.ended && counted && end <= file.FileSize() ? Status::Ok : Status::FileReadError;
+}
+
+}  // namespace
+
+Status FitsInfo(PictureRecord& picture, const char* fileName, uint32_t) {
+  platform::FileView file;
+  if (!file.OpenHead(fileName, limits.fitsCards * kCardBytes)) return Status::FileOpenError;
+  if (file.Bytes().size() < kSignature.size()) return Status::FileReadError;
+  if (!ByteReader(file.Bytes()).Match(kSignature)) return Status::DamagedFile;
+  FitsHeader header;
+  return DescribePicture(file, picture, header);
+}
+
+Status FitsRead(PictureRecord& picture, const char* fileName) {
+  const ProgressScope progress(picture);
+  picture.image.Free();
+  picture.alpha.Free();
+  platform::FileView file;
+  if (!file.Open(fileName)) return Status::FileOpenError;
+  FitsHeader header;
+  RETURN_IF_BAD(DescribePicture(file, picture, header));
+  RETURN_IF_BAD(CheckRowsFit(file, header));
+
+  PackedImage image;
+  RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette, 8, image, platform::Fill::Unset));
+  ByteReader bytes(file.Bytes());
+  bytes.Seek(header.dataOffset);
+  for (int32_t y = 0; y < picture.height; ++y) {
+    CopyRow(bytes.Take(header.RowBytes()), image.Row(y));
+    file.DropBefore(bytes.Position());
+    picture.ReportRow(y);
+  }
+  if (!file.Intact()) return Status::FileReadError;
+  picture.image = std::move(image);
+  return Status::Ok;
+}
+
+Status FitsWrite(PictureRecord& picture, const WriteOptions& options) {
+  const ProgressScope progress(picture);
+  const PackedImage& image = picture.image;
+  if (image.Empty()) return Status::MemoryAllocationError;
+  ByteWriter out;
+  if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
+  const GreyTable greys = PaletteGreys(picture);
+  WriteHeader(out, image);
+  const GreyPixels greyPixels = GreyPixelsFor(image.Bits());
+  const auto width = static_cast<size_t>(image.Width()), bits = static_cast<size_t>(image.Bits());
+  for (int32_t y = 0; y < image.Height() && !out.Failed(); ++y) {
+    picture.ReportRow(y);
+    const uint8_t* row = image.Row(y).data();
+    for (size_t x = 0; x < width; x += ByteWriter::kMostReserved) {
+      const size_t count = std::min(width - x, ByteWriter::kMostReserved);
+      greyPixels(row + x * bits / 8, greys, count, out.Reserve(count));
+      out.Used(count);
+    }
+  }
+  out.Zeros((kBlockBytes - out.Position() % kBlockBytes) % kBlockBytes);
+  return CommitOutput(out, options);
+}
+
+Status FitsDetails(PictureRecord& picture) {
+  picture.detailLines.Clear();
+  platform::FileView file;
+  if (!file.OpenHead(picture.fileName.c_str(), kMostDetailLines * kCardBytes)) return Status::FileOpenError;
+  ByteReader bytes(file.Bytes());
+  FitsCard card;
+  while (picture.detailLines.Count() < kMostDetailLines && NextCard(bytes, card)) {
+    picture.detailLines.Add(std::string(card.keyword).append(" = ").append(card.value));
+    if (card.keyword == "END") break;
+  }
+  return Status::Ok;
+}
+
+}  // namespace fotomill

@@ -1,0 +1,391 @@
+// Windows icons and cursors (ICO, CUR), little-endian.
+//
+//   offset size  field
+//        0    2  reserved, 0
+//        2    2  1: icons, 2: cursors
+//        4    2  number of entries
+//        6       entries of 16 bytes:
+//       +0    2  width and height, 0 for 256
+//       +2    2  number of colours, reserved
+//       +4    4  icons: planes and bits per pixel; cursors: hot spot x and y
+//       +8    4  bytes of the entry's picture
+//      +12    4  its offset
+//
+// A picture is a whole PNG file, or a bitmap without file header: a 40-byte information header whose height counts both of
+// the following bitmaps, the palette of blue, green, red, 0, the colours at 1, 4, 8, 16, 24 or 32 bits, then the AND mask
+// at 1 bit (set: transparent). Rows run from the bottom up, each padded to 4 bytes.
+//
+// The reader takes the largest entry, among equals the deepest, by what the pictures themselves say: the numbers in the
+// entries are often wrong. A bitmap of up to 8 bits without a transparent pixel keeps its palette; everything else becomes
+// 24 bits with an alpha plane. The fourth byte of 32-bit pixels is alpha unless it is 0 everywhere, as old programs left
+// it; then the mask counts. A mask that the file lacks is opaque.
+//
+// The writer stores one bitmap with its mask; 24 bits with an alpha plane as 32. ICOCompression asks for a PNG file
+// instead, for 256 x 256 pixels or for every size.
+// Source: Microsoft, "Icons in Win32" (J. Hornick, 1995); "The evolution of the ICO file format" (R. Chen, 2010).
+#include "formats/icon/ico.h"
+
+#include <algorithm>
+#include <cstring>
+#include <functional>
+#include <vector>
+
+#include "core/byte_reader.h"
+#include "core/byte_writer.h"
+#include "core/choice_lists.h"
+#include "core/text.h"
+#include "formats/png/png.h"
+#include "platform/file_view.h"
+#include "platform/paths.h"
+#include "settings/settings.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr uint16_t kIcons = 1, kCursors = 2;
+constexpr uint32_t kInfoSize = 40;
+constexpr int32_t kMostSide = 256;
+constexpr uint32_t kFileHeaderSize = 6, kEntrySize = 16;
+constexpr uint32_t kSizeOffset = kFileHeaderSize + 8;  // of the first entry's size
+
+struct IcoEntry {
+  uint16_t hotSpotX = 0, hotSpotY = 0;  // of a cursor
+  std::span<const uint8_t> bytes;       // its picture, and all that follows in the file
+};
+
+struct IcoFile {
+  bool cursors = false;
+  std::vector<IcoEntry> entries;
+};
+
+Status ParseDirectory(std::span<const uint8_t> file, IcoFile& icons) {
+  ByteReader bytes(file);
+  const uint16_t reserved = bytes.Le16(), type = bytes.Le16(), count = bytes.Le16();
+  if (!bytes.Ok() || reserved != 0 || (type != kIcons && type != kCursors)) return Status::DamagedFile;
+  icons.cursors = type == kCursors;
+  for (uint16_t i = 0; i < count; ++i) {
+    bytes.Skip(4);
+    IcoEntry entry;
+    entry.hotSpotX = bytes.Le16();
+    entry.hotSpotY = bytes.Le16();
+    bytes.Skip(4);  // the size is often wrong; the picture itself knows better
+    const uint64_t offset = bytes.Le32();
+    if (!bytes.Ok()) return Status::FileReadError;
+    if (offset >= file.size()) continue;  // points nowhere; the others may be good
+    entry.bytes = file.subspan(offset);
+    icons.entries.push_back(entry);
+  }
+  return icons.entries.empty() ? Status::NoImages : Status::Ok;
+}
+
+// A bitmap entry, parsed.
+struct IcoBitmap {
+  int32_t width = 0, height = 0;  // of the picture, not of both bitmaps
+  uint16_t bits = 0;
+  uint32_t compression = 0;
+  std::span<const uint8_t> palette, colors, mask;  // mask: empty when the file lacks it
+
+  uint64_t Stride() const { return RowStride(width, bits); }
+  std::span<const uint8_t> Row(int32_t r) const { return colors.subspan(static_cast<uint64_t>(r) * Stride(), Stride()); }
+  // Whether the mask makes the pixel in stored row r transparent.
+  bool Masked(int32_t x, int32_t r) const {
+    if (mask.empty()) return false;
+    const uint64_t place = static_cast<uint64_t>(r) * RowStride(width, 1) + static_cast<uint64_t>(x) / 8;
+    return (mask[place] >> (7 - x % 8) & 1) != 0;
+  }
+};
+
+// Ok; DamagedFile for a header that makes no sense, UnsupportedFormat for compression, FileReadError for missing colours.
+Status ParseBitmap(std::span<const uint8_t> entry, IcoBitmap& bitmap) {
+  ByteReader bytes(entry);
+  const uint32_t infoSize = bytes.Le32();
+  bitmap.width = static_cast<int32_t>(bytes.Le32());
+  const auto bothHeights = static_cast<int32_t>(bytes.Le32());
+  bytes.Skip(2);
+  bitmap.bits = bytes.Le16();
+  bitmap.compression = bytes.Le32();
+  bytes.Skip(12);
+  const uint32_t colorsUsed = bytes.Le32();
+  if (!bytes.Ok()) return Status::FileReadError;
+  if (infoSize < kInfoSize || bitmap.width < 1 || bothHeights < 2) return Status::DamagedFile;
+  bitmap.height = bothHeights / 2;
+  constexpr uint16_t kDepths[] = {1, 4, 8, 16, 24, 32};
+  if (std::ranges::find(kDepths, bitmap.bits) == std::end(kDepths)) return Status::DamagedFile;
+  if (bitmap.compression != 0) return Status::UnsupportedFormat;
+  const uint32_t most = bitmap.bits <= 8 ? 1u << bitmap.bits : 0;
+  bytes.Seek(infoSize);
+  bitmap.palette = bytes.Take(uint64_t{4} * (colorsUsed == 0 || colorsUsed > most ? most : colorsUsed));
+  if (bytes.Left() / bitmap.Stride() < static_cast<uint64_t>(bitmap.height)) return Status::FileReadError;
+  bitmap.colors = bytes.Take(bitmap.Stride() * static_cast<uint64_t>(bitmap.height));
+  const uint64_t maskSize = RowStride(bitmap.width, 1) * static_cast<uint64_t>(bitmap.height);
+  if (bytes.Left() >= maskSize) bitmap.mask = bytes.Take(maskSize);
+  return bytes.Ok() ? Status::Ok : Status::FileReadError;
+}
+
+bool IsPng(std::span<const uint8_t> entry) {
+  constexpr uint8_t kPngSignature[] = {0x89, 'P', 'N', 'G', '\r', '\n', 0x1A, '\n'};
+  return entry.size() > 24 && std::equal(std::begin(kPngSignature), std::end(kPngSignature), entry.begin());
+}
+
+// How good an entry is: its area first, then its depth; 0 for one that cannot be read.
+uint64_t Rank(const IcoEntry& entry) {
+  if (IsPng(entry.bytes)) {
+    ByteReader bytes(entry.bytes);
+    bytes.Seek(16);  // width and height of the first chunk
+    const uint64_t width = bytes.Be32(), height = bytes.Be32();
+    return width > UINT16_MAX || height > UINT16_MAX ? 0 : width * height * 64 + 32;
+  }
+  IcoBitmap bitmap;
+  if (ParseBitmap(entry.bytes, bitmap) != Status::Ok) return 0;
+  return static_cast<uint64_t>(bitmap.width) * static_cast<uint64_t>(bitmap.height) * 64 + bitmap.bits;
+}
+
+// Entry number `page` from the best one down; null beyond the last.
+const IcoEntry* ChooseEntry(IcoFile& icons, int32_t page) {
+  std::ranges::stable_sort(icons.entries, std::greater(), Rank);
+  return static_cast<size_t>(page) < icons.entries.size() ? &icons.entries[static_cast<size_t>(page)] : nullptr;
+}
+
+bool AnyMasked(const IcoBitmap& bitmap) {
+  for (int32_t r = 0; r < bitmap.height; ++r) {
+    for (int32_t x = 0; x < bitmap.width; ++x) {
+      if (bitmap.Masked(x, r)) return true;
+    }
+  }
+  return false;
+}
+
+// Whether the fourth bytes of 32-bit pixels say anything.
+bool HasAlphaBytes(const IcoBitmap& bitmap) {
+  if (bitmap.bits != 32) return false;
+  for (size_t i = 3; i < bitmap.colors.size(); i += 4) {
+    if (bitmap.colors[i] != 0) return true;
+  }
+  return false;
+}
+
+bool NeedsAlpha(const IcoBitmap& bitmap) { return HasAlphaBytes(bitmap) || AnyMasked(bitmap); }
+
+void DescribeBitmap(const IcoBitmap& bitmap, PictureRecord& picture) {
+  const bool alpha = NeedsAlpha(bitmap);
+  picture.width = bitmap.width;
+  picture.height = bitmap.height;
+  picture.bitsPerPixel = alpha || bitmap.bits > 8 ? 24 : bitmap.bits;
+  picture.alphaFlags = static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (alpha ? kHasAlpha : 0));
+  if (picture.bitsPerPixel == 24) {
+    MakeDefaultPalette(&picture.palette, nullptr, kDisplayPalette);
+    return;
+  }
+  picture.palette.fill(0);
+  for (size_t i = 0; i < bitmap.palette.size() / 4; ++i) {
+    picture.palette[3 * i] = bitmap.palette[4 * i + 2];
+    picture.palette[3 * i + 1] = bitmap.palette[4 * i + 1];
+    picture.palette[3 * i + 2] = bitmap.palette[4 * i];
+  }
+}
+
+uint8_t FiveToEight(uint32_t value) { return static_cast<uint8_t>(value << 3 | value >> 2); }
+
+// The colour of column x as blue, green, red.
+void ColorAt(const IcoBitmap& bitmap, std::span<const uint8_t> row, size_t x, uint8_t* color) {
+  if (bitmap.bits == 16) {
+    const uint32_t value = static_cast<uint32_t>(row[2 * x] | row[2 * x + 1] << 8);
+    color[0] = FiveToEight(value & 31);
+    color[1] = FiveToEight(value >> 5 & 31);
+    color[2] = FiveToEight(value >> 10 & 31);
+  } else if (bitmap.bits > 16) {
+    std::memcpy(color, &row[x * (bitmap.bits / 8u)], 3);
+  } else {
+    const size_t perByte = 8u / bitmap.bits;
+    const size_t shift = (perByte - 1 - x % perByte) * bitmap.bits;
+    const size_t entry = 4 * (row[x / perByte] >> shift & ((1u << bitmap.bits) - 1));
+    if (entry < bitmap.palette.size()) std::memcpy(color, &bitmap.palette[entry], 3);
+  }
+}
+
+Status ReadBitmap(const IcoBitmap& bitmap, PictureRecord& picture, PackedImage& image, PackedImage& alpha) {
+  RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette, picture.bitsPerPixel, image));
+  const bool alphaBytes = HasAlphaBytes(bitmap);
+  if ((picture.alphaFlags & kHasAlpha) != 0) RETURN_IF_BAD(NewAlphaPlane(picture.width, picture.height, alpha));
+  for (int32_t r = 0; r < bitmap.height; ++r) {
+    const auto source = bitmap.Row(r);
+    const auto row = image.StoredRow(r);
+    if (image.Bits() == bitmap.bits) {
+      std::copy(source.begin(), source.end(), row.begin());
+    } else {
+      for (size_t x = 0; x < static_cast<size_t>(bitmap.width); ++x) ColorAt(bitmap, source, x, &row[3 * x]);
+    }
+    for (int32_t x = 0; x < bitmap.width && !alpha.Empty(); ++x) {
+      const auto column = static_cast<size_t>(x);
+      alpha.StoredRow(r)[column] = alphaBytes ? source[4 * column + 3] : bitmap.Masked(x, r) ? 0 : 255;
+    }
+    picture.ReportRow(r);
+  }
+  return Status::Ok;
+}
+
+// A PNG entry is a whole file of its own; the names and pages of the icon stay.
+Status LoadPngEntry(std::span<const uint8_t> entry, PictureRecord& picture, PackedImage* image, PackedImage* alpha) {
+  const FixedText<64> typeName = picture.typeName;
+  const int32_t pages = picture.pageCount;
+  const Status status = image == nullptr ? DescribePng(entry, picture) : DecodePng(entry, picture);
+  picture.typeName = typeName;
+  picture.pageCount = pages;
+  RETURN_IF_BAD(status);
+  if (image != nullptr) {
+    *image = std::move(picture.image);
+    *alpha = std::move(picture.alpha);
+  }
+  return Status::Ok;
+}
+
+// Facts, and with `image` the pixels, of the entry that the picture's page selects.
+Status LoadEntry(IcoFile& icons, PictureRecord& picture, PackedImage* image, PackedImage* alpha) {
+  const IcoEntry* entry = ChooseEntry(icons, picture.page);
+  if (entry == nullptr) return Status::NoImages;
+  picture.typeName.AssignCut(icons.cursors ? "Windows cursor" : "Windows icon");
+  picture.pageCount = static_cast<int32_t>(icons.entries.size());
+  picture.hotSpotX = icons.cursors ? entry->hotSpotX : 0;
+  picture.hotSpotY = icons.cursors ? entry->hotSpotY : 0;
+  if (IsPng(entry->bytes)) return LoadPngEntry(entry->bytes, picture, image, alpha);
+  IcoBitmap bitmap;
+  RETURN_IF_BAD(ParseBitmap(entry->bytes, bitmap));
+  DescribeBitmap(bitmap, picture);
+  picture.imageBytes = EstimateImageBytes(picture.width, picture.height, picture.bitsPerPixel);
+  return image == nullptr ? Status::Ok : ReadBitmap(bitmap, picture, *image, *alpha);
+}
+
+// What the writer stores: the bitmap's depth, with the sizes that its header and entry name.
+struct IcoLayout {
+  int32_t bits = 0;
+  uint32_t colors = 0;
+  uint32_t colorBytes = 0, maskBytes = 0;
+  bool cursor = false;
+  bool png = false;
+
+  uint32_t PictureSize() const { return kInfoSize + 4 * colors + colorBytes + maskBytes; }
+};
+
+IcoLayout ChooseLayout(const PictureRecord& picture) {
+  const PackedImage& image = picture.image;
+  IcoLayout layout;
+  layout.bits = image.Bits() == 24 && !picture.alpha.Empty() ? 32 : image.Bits();
+  layout.colors = static_cast<uint32_t>(image.Colors());
+  layout.colorBytes = static_cast<uint32_t>(RowStride(image.Width(), layout.bits)) * static_cast<uint32_t>(image.Height());
+  layout.maskBytes = static_cast<uint32_t>(RowStride(image.Width(), 1)) * static_cast<uint32_t>(image.Height());
+  layout.cursor = EqualIgnoringCase(platform::ExtensionOf(picture.fileName), "cur");
+  const bool fullSize = image.Width() == kMostSide && image.Height() == kMostSide;
+  layout.png = settings.ICOCompression == choice::kIconPngAlways || (settings.ICOCompression == choice::kIconPng256 && fullSize);
+  return layout;
+}
+
+void WriteDirectory(ByteWriter& out, const PictureRecord& picture, const IcoLayout& layout) {
+  out.Le16(0);
+  out.Le16(layout.cursor ? kCursors : kIcons);
+  out.Le16(1);
+  out.U8(static_cast<uint8_t>(picture.image.Width()));  // 256 becomes 0, as it should
+  out.U8(static_cast<uint8_t>(picture.image.Height()));
+  out.U8(static_cast<uint8_t>(layout.colors));
+  out.U8(0);
+  out.Le16(layout.cursor ? static_cast<uint16_t>(picture.hotSpotX) : 1);
+  out.Le16(static_cast<uint16_t>(layout.cursor ? picture.hotSpotY : layout.bits));
+  out.Le32(layout.PictureSize());
+  out.Le32(kFileHeaderSize + kEntrySize);
+}
+
+void WriteBitmapHeader(ByteWriter& out, const PictureRecord& picture, const IcoLayout& layout) {
+  out.Le32(kInfoSize);
+  out.Le32(static_cast<uint32_t>(picture.image.Width()));
+  out.Le32(2 * static_cast<uint32_t>(picture.image.Height()));
+  out.Le16(1);
+  out.Le16(static_cast<uint16_t>(layout.bits));
+  out.Le32(0);
+  out.Le32(layout.colorBytes + layout.maskBytes);
+  out.Zeros(8);
+  out.Le32(layout.colors);
+  out.Le32(0);
+  for (size_t i = 0; i < 3 * size_t{layout.colors}; i += 3) {
+    out.U8(picture.palette[i + 2]);
+    out.U8(picture.palette[i + 1]);
+    out.U8(picture.palette[i]);
+    out.U8(0);
+  }
+}
+
+void WriteColors(ByteWriter& out, const PictureRecord& picture, const IcoLayout& layout) {
+  for (int32_t r = 0; r < picture.image.Height(); ++r) {
+    const auto row = picture.image.StoredRow(r);
+    picture.ReportRow(r);
+    if (layout.bits != 32) {
+      out.Bytes(row);
+      continue;
+    }
+    const auto alpha = picture.alpha.StoredRow(r);
+    for (size_t x = 0; x < static_cast<size_t>(picture.image.Width()); ++x) {
+      out.Bytes(row.subspan(3 * x, 3));
+      out.U8(alpha[x]);
+    }
+  }
+}
+
+// Pixels of less than half opacity are transparent for programs that know the mask alone.
+void WriteMask(ByteWriter& out, const PictureRecord& picture) {
+  std::vector<uint8_t> mask(RowStride(picture.image.Width(), 1));
+  for (int32_t r = 0; r < picture.image.Height(); ++r) {
+    std::ranges::fill(mask, uint8_t{0});
+    for (size_t x = 0; x < static_cast<size_t>(picture.image.Width()) && !picture.alpha.Empty(); ++x) {
+      if (picture.alpha.StoredRow(r)[x] < 128) mask[x / 8] |= static_cast<uint8_t>(0x80 >> x % 8);
+    }
+    out.Bytes(mask);
+  }
+}
+
+}  // namespace
+
+Status IcoInfo(PictureRecord& picture, const char* fileName, uint32_t) {
+  picture.typeName.Clear();
+  platform::FileView file;
+  if (!file.Open(fileName)) return Status::FileOpenError;
+  picture.fileSize = file.FileSize();
+  IcoFile icons;
+  RETURN_IF_BAD(ParseDirectory(file.Bytes(), icons));
+  return LoadEntry(icons, picture, nullptr, nullptr);
+}
+
+Status IcoRead(PictureRecord& picture, const char* fileName) {
+  const ProgressScope progress(picture);
+  picture.image.Free();
+  picture.alpha.Free();
+  platform::FileView file;
+  if (!file.Open(fileName)) return Status::FileOpenError;
+  IcoFile icons;
+  RETURN_IF_BAD(ParseDirectory(file.Bytes(), icons));
+  PackedImage image, alpha;
+  RETURN_IF_BAD(LoadEntry(icons, picture, &image, &alpha));
+  if (!file.Intact()) return Status::FileReadError;
+  picture.image = std::move(image);
+  picture.alpha = std::move(alpha);
+  return Status::Ok;
+}
+
+Status IcoWrite(PictureRecord& picture, const WriteOptions& options) {
+  const ProgressScope progress(picture);
+  if (picture.image.Empty()) return Status::MemoryAllocationError;
+  if (picture.image.Width() > kMostSide || picture.image.Height() > kMostSide) return Status::UnsuitableImage;
+  ByteWriter out;
+  if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
+  const IcoLayout layout = ChooseLayout(picture);
+  WriteDirectory(out, picture, layout);
+  if (layout.png) {
+    RETURN_IF_BAD(EncodePng(picture, out));
+    out.PatchLe32(kSizeOffset, static_cast<uint32_t>(out.Position()) - kFileHeaderSize - kEntrySize);
+  } else {
+    WriteBitmapHeader(out, picture, layout);
+    WriteColors(out, picture, layout);
+    WriteMask(out, picture);
+  }
+  return CommitOutput(out, options);
+}
+
+}  // namespace fotomill

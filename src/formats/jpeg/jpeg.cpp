@@ -1,0 +1,385 @@
+// JPEG (JFIF, Exif), big-endian, decoded and encoded by libjpeg.
+//
+//   FF D8, then segments of FF, a marker byte, a length (2 bytes, itself included) and data:
+//   E0 "JFIF" resolution      E1 "Exif\0\0" EXIF, "http://ns.adobe.com/xap/1.0/\0" XMP      E2 "ICC_PROFILE\0" n of m
+//   EE "Adobe" colour transform      FE comment      DB, C4 tables      C0-CF frame      DA scan and its data      D9 end
+//
+// Grey pictures become 8 bits with a grey palette, all others 24 bits. CMYK and YCCK are turned into RGB by the usual
+// formula, with the inverted values that Adobe's programs store. EXIF, XMP, ICC profile, comment and resolution travel with
+// the picture; its orientation is not applied here.
+//
+// Broken data: a file that ends before its last pixel fails (status 3). A fault inside the data that the decoder can pass
+// over is told in the record's `warning`, and the picture is shown with it; a missing end marker is no fault.
+//
+// The writer makes baseline or progressive files (WriteJpegProgressive) of quality JpegCompression and chroma sampling
+// JpegSubsample. Greys stay grey; other palettes are promoted. JpegStoreDPI stores a resolution: the picture's, else
+// TiffResolution.
+// Source: ITU-T T.81 (1992) and T.871 (2011); Adobe Technical Note 5116; XMP specification part 3; ICC.1:2022, annex B.4.
+#include "formats/jpeg/jpeg.h"
+
+#include <algorithm>
+#include <cmath>
+#include <cstring>
+#include <string_view>
+#include <vector>
+
+#include "containers/jpeg_segments.h"
+#include "core/byte_reader.h"
+#include "core/byte_writer.h"
+#include "core/choice_lists.h"
+#include "core/limits.h"
+#include "formats/jpeg/jpeg_library.h"
+#include "platform/file_view.h"
+#include "settings/settings.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr std::string_view kIccHead("ICC_PROFILE\0", 12);
+constexpr int kApp1 = JPEG_APP0 + 1, kApp2 = JPEG_APP0 + 2;
+constexpr unsigned kWholeSegment = 0xFFFF;
+
+// Reads up to the first scan, keeping the segments that travel.
+Status ReadHeader(JpegReader& reader, std::span<const uint8_t> file) {
+  return ReadJpegHeader(reader, file, [](j_decompress_ptr info) {
+    for (const int marker : {kApp1, kApp2, JPEG_COM}) jpeg_save_markers(info, marker, kWholeSegment);
+  });
+}
+
+bool IsGrey(const jpeg_decompress_struct& info) { return info.jpeg_color_space == JCS_GRAYSCALE; }
+bool IsCmyk(const jpeg_decompress_struct& info) { return info.jpeg_color_space == JCS_CMYK || info.jpeg_color_space == JCS_YCCK; }
+
+std::string_view DataOf(const jpeg_marker_struct& marker) {
+  return {static_cast<const char*>(static_cast<const void*>(marker.data)), marker.data_length};
+}
+
+void Append(std::vector<uint8_t>& block, std::string_view data) {
+  if (block.size() + data.size() <= limits.metadataBytes) block.insert(block.end(), data.begin(), data.end());
+}
+
+// The profile's pieces may come in any order; each names its number from 1 and how many there are.
+void JoinProfile(const jpeg_decompress_struct& info, std::vector<uint8_t>& profile) {
+  for (unsigned wanted = 1; wanted <= 255; ++wanted) {
+    bool found = false;
+    for (jpeg_saved_marker_ptr marker = info.marker_list; marker != nullptr && !found; marker = marker->next) {
+      const std::string_view data = DataOf(*marker);
+      found =
+          marker->marker == kApp2 && data.starts_with(kIccHead) && data.size() > 14 && static_cast<uint8_t>(data[12]) == wanted;
+      if (found) Append(profile, data.substr(14));
+    }
+    if (!found) return;
+  }
+}
+
+void TakeMetadata(const jpeg_decompress_struct& info, PictureRecord& picture) {
+  PictureMetadata& metadata = picture.metadata;
+  metadata = {};
+  picture.comment.clear();
+  for (jpeg_saved_marker_ptr marker = info.marker_list; marker != nullptr; marker = marker->next) {
+    const std::string_view data = DataOf(*marker);
+    if (marker->marker == JPEG_COM) {
+      if (picture.comment.empty()) Append(picture.comment, data.substr(0, data.find('\0')));
+    } else if (marker->marker == kApp1 && data.starts_with(kExifHead) && metadata.exif.empty()) {
+      Append(metadata.exif, data.substr(kExifHead.size()));
+    } else if (marker->marker == kApp1 && data.starts_with(kXmpHead) && metadata.xmp.empty()) {
+      Append(metadata.xmp, data.substr(kXmpHead.size()));
+    }
+  }
+  JoinProfile(info, metadata.icc);
+  if (info.saw_JFIF_marker && (info.density_unit == 1 || info.density_unit == 2)) {
+    const double perInch = info.density_unit == 2 ? 2.54 : 1;
+    metadata.dpiX = info.X_density * perInch;
+    metadata.dpiY = info.Y_density * perInch;
+  }
+}
+
+Status DescribePicture(const jpeg_decompress_struct& info, PictureRecord& picture) {
+  picture.typeName.AssignCut(info.progressive_mode ? "Progressive JPEG" : "JPEG");
+  picture.width = static_cast<int32_t>(info.image_width);
+  picture.height = static_cast<int32_t>(info.image_height);
+  picture.bitsPerPixel = IsGrey(info) ? 8 : 24;
+  picture.imageBytes = EstimateImageBytes(picture.width, picture.height, picture.bitsPerPixel);
+  if (IsGrey(info)) {
+    picture.palette = GreyRamp();
+  } else {
+    MakeDefaultPalette(&picture.palette, nullptr, kDisplayPalette);
+  }
+  TakeMetadata(info, picture);
+  return picture.width < 1 || picture.height < 1 ? Status::DamagedFile : Status::Ok;
+}
+
+// Sets what comes out: colours, and the smallest size in eighths whose longer edge is still twice the side asked for.
+void SetOutput(jpeg_decompress_struct& info, int32_t thumbnailSide) {
+  info.out_color_space = IsGrey(info) ? JCS_GRAYSCALE : IsCmyk(info) ? JCS_CMYK : JCS_EXT_BGR;
+  info.scale_denom = 8;
+  info.scale_num = 8;
+  const auto longer = static_cast<int64_t>(std::max(info.image_width, info.image_height));
+  for (const unsigned eighths : {4u, 2u, 1u}) {
+    if (thumbnailSide > 0 && longer * eighths / 8 >= 2 * int64_t{thumbnailSide}) info.scale_num = eighths;
+  }
+  jpeg_calc_output_dimensions(&info);
+}
+
+// Ink to light. Adobe's programs store 255 for no ink, the standard's reading is the reverse.
+void CmykToBgr(const uint8_t* ink, uint8_t* color, size_t width, bool inverted) {
+  for (size_t x = 0; x < width; ++x, ink += 4, color += 3) {
+    for (size_t i = 0; i < 3; ++i) {
+      const uint32_t tint = inverted ? ink[2 - i] : 255u - ink[2 - i];
+      const uint32_t key = inverted ? ink[3] : 255u - ink[3];
+      color[i] = static_cast<uint8_t>((tint * key + 127) / 255);
+    }
+  }
+}
+
+Status ReadPixels(JpegReader& reader, const PictureRecord& picture, PackedImage& image) {
+  jpeg_decompress_struct& info = reader.info;
+  const bool cmyk = info.out_color_space == JCS_CMYK;
+  std::vector<uint8_t> ink(cmyk ? 4 * static_cast<size_t>(info.output_width) : 0);
+  const bool read = Guarded(reader.errors, [&] {
+    jpeg_start_decompress(&info);
+    while (info.output_scanline < info.output_height) {
+      const auto y = static_cast<int32_t>(info.output_scanline);
+      uint8_t* target = image.Row(y).data();
+      JSAMPROW row = cmyk ? ink.data() : target;
+      jpeg_read_scanlines(&info, &row, 1);
+      if (cmyk) CmykToBgr(ink.data(), target, info.output_width, info.saw_Adobe_marker);
+      picture.ReportRow(y, image.Height());
+    }
+  });
+  if (!read) return reader.Failure();
+  return reader.errors.cutShort && reader.errors.endMissing ? Status::FileReadError : Status::Ok;
+}
+
+struct JpegWriter {
+  JpegWriter() {
+    errors.Set();
+    info.err = &errors.base;
+  }
+  ~JpegWriter() { jpeg_destroy_compress(&info); }
+  JpegWriter(const JpegWriter&) = delete;
+  JpegWriter& operator=(const JpegWriter&) = delete;
+
+  JpegErrors errors;
+  jpeg_compress_struct info = {};
+  jpeg_destination_mgr destination = {};
+  ByteWriter out;
+};
+
+// The library fills the file's own buffer.
+void OfferBuffer(j_compress_ptr info) {
+  auto* out = static_cast<ByteWriter*>(info->client_data);
+  info->dest->next_output_byte = out->Reserve(ByteWriter::kMostReserved);
+  info->dest->free_in_buffer = ByteWriter::kMostReserved;
+}
+boolean TakeFullBuffer(j_compress_ptr info) {
+  static_cast<ByteWriter*>(info->client_data)->Used(ByteWriter::kMostReserved);
+  OfferBuffer(info);
+  return TRUE;
+}
+void TakeLastBuffer(j_compress_ptr info) {
+  static_cast<ByteWriter*>(info->client_data)->Used(ByteWriter::kMostReserved - info->dest->free_in_buffer);
+}
+
+bool HasGreyPalette(const PictureRecord& picture) {
+  const size_t colors = static_cast<size_t>(picture.image.Colors());
+  for (size_t i = 0; i < colors; ++i) {
+    if (picture.palette[3 * i] != picture.palette[3 * i + 1] || picture.palette[3 * i] != picture.palette[3 * i + 2])
+      return false;
+  }
+  return colors > 0;
+}
+
+void SetSampling(jpeg_compress_struct& info) {
+  if (info.num_components != 3) return;
+  const int32_t choice = settings.JpegSubsample;
+  info.comp_info[0].h_samp_factor = choice == choice::kSubsample444 ? 1 : 2;
+  info.comp_info[0].v_samp_factor = choice == choice::kSubsample420 ? 2 : 1;
+}
+
+void SetResolution(jpeg_compress_struct& info, const PictureMetadata& metadata) {
+  if (settings.JpegStoreDPI == 0) return;
+  const auto clamp = [](double dpi) { return static_cast<UINT16>(std::clamp<long>(std::lround(dpi), 1, 65535)); };
+  info.density_unit = 1;
+  info.X_density = clamp(metadata.dpiX > 0 ? metadata.dpiX : settings.TiffResolution);
+  info.Y_density = clamp(metadata.dpiY > 0 ? metadata.dpiY : settings.TiffResolution);
+}
+
+void SetParameters(JpegWriter& writer, const PictureRecord& picture, bool grey) {
+  jpeg_compress_struct& info = writer.info;
+  jpeg_create_compress(&info);
+  info.client_data = &writer.out;
+  info.dest = &writer.destination;
+  writer.destination.init_destination = OfferBuffer;
+  writer.destination.empty_output_buffer = TakeFullBuffer;
+  writer.destination.term_destination = TakeLastBuffer;
+  info.image_width = static_cast<JDIMENSION>(picture.image.Width());
+  info.image_height = static_cast<JDIMENSION>(picture.image.Height());
+  info.input_components = grey ? 1 : 3;
+  info.in_color_space = grey ? JCS_GRAYSCALE : JCS_EXT_BGR;
+  jpeg_set_defaults(&info);
+  jpeg_set_quality(&info, std::clamp<int>(settings.JpegCompression, 1, 100), TRUE);
+  SetSampling(info);
+  SetResolution(info, picture.metadata);
+  if (settings.WriteJpegProgressive != 0) {
+    jpeg_simple_progression(&info);
+  } else {
+    info.optimize_coding = FALSE;
+  }
+}
+
+// One segment of a heading and data. False, without a trace, when there is too much for one.
+bool WriteSegment(jpeg_compress_struct& info, int marker, std::string_view head, std::span<const uint8_t> data) {
+  if (data.empty()) return true;
+  if (head.size() + data.size() > kMostSegment) return false;
+  jpeg_write_m_header(&info, marker, static_cast<unsigned>(head.size() + data.size()));
+  for (const char c : head) jpeg_write_m_byte(&info, static_cast<uint8_t>(c));
+  for (const uint8_t byte : data) jpeg_write_m_byte(&info, byte);
+  return true;
+}
+
+bool WriteProfile(jpeg_compress_struct& info, std::span<const uint8_t> profile) {
+  constexpr size_t kPiece = kMostSegment - 14;
+  const size_t pieces = (profile.size() + kPiece - 1) / kPiece;
+  if (pieces > 255) return false;
+  for (size_t i = 0; i < pieces; ++i) {
+    char head[14];
+    std::copy(kIccHead.begin(), kIccHead.end(), head);
+    head[12] = static_cast<char>(i + 1);
+    head[13] = static_cast<char>(pieces);
+    const auto piece = profile.subspan(i * kPiece, std::min(kPiece, profile.size() - i * kPiece));
+    (void)WriteSegment(info, kApp2, {head, sizeof head}, piece);  // pieces fit
+  }
+  return true;
+}
+
+void WriteMetadata(jpeg_compress_struct& info, PictureRecord& picture) {
+  if (!WriteSegment(info, kApp1, kExifHead, picture.metadata.exif)) picture.lostMetadata |= kLostExif;
+  if (!WriteSegment(info, kApp1, kXmpHead, picture.metadata.xmp)) picture.lostMetadata |= kLostXmp;
+  if (!WriteProfile(info, picture.metadata.icc)) picture.lostMetadata |= kLostIcc;
+  (void)WriteSegment(info, JPEG_COM, {}, picture.comment);
+}
+
+// A row as the encoder takes it: greys, or blue, green, red.
+void ExpandRow(const PictureRecord& picture, int32_t y, bool grey, std::vector<uint8_t>& target) {
+  const auto row = picture.image.Row(y);
+  const auto bits = static_cast<size_t>(picture.image.Bits());
+  const size_t perByte = 8 / bits;
+  const uint32_t mask = (1u << bits) - 1;
+  for (size_t x = 0; x < static_cast<size_t>(picture.image.Width()); ++x) {
+    const uint8_t* color = &picture.palette[3 * (row[x / perByte] >> (perByte - 1 - x % perByte) * bits & mask)];
+    if (grey) {
+      target[x] = color[0];
+    } else {
+      target[3 * x] = color[2];
+      target[3 * x + 1] = color[1];
+      target[3 * x + 2] = color[0];
+    }
+  }
+}
+
+Status WriteAll(JpegWriter& writer, PictureRecord& picture, bool keep) {
+  const PackedImage& image = picture.image;
+  const bool grey = HasGreyPalette(picture);
+  std::vector<uint8_t> expanded(image.Bits() == 24 ? 0 : (grey ? 1 : 3) * static_cast<size_t>(image.Width()));
+  const bool written = Guarded(writer.errors, [&] {
+    SetParameters(writer, picture, grey);
+    jpeg_start_compress(&writer.info, TRUE);
+    if (keep) WriteMetadata(writer.info, picture);
+    for (int32_t y = 0; y < image.Height(); ++y) {
+      if (!expanded.empty()) ExpandRow(picture, y, grey, expanded);
+      JSAMPROW row = expanded.empty() ? const_cast<JSAMPROW>(image.Row(y).data()) : expanded.data();
+      jpeg_write_scanlines(&writer.info, &row, 1);
+      picture.ReportRow(y);
+    }
+    jpeg_finish_compress(&writer.info);
+  });
+  return written ? Status::Ok : Status::ErrorWritingFile;
+}
+
+const char* ColorSpaceName(J_COLOR_SPACE space) {
+  switch (space) {
+    case JCS_GRAYSCALE: return "grey";
+    case JCS_RGB: return "RGB";
+    case JCS_YCbCr: return "YCbCr";
+    case JCS_CMYK: return "CMYK";
+    case JCS_YCCK: return "YCCK";
+    default: return "unknown";
+  }
+}
+
+void AddDetails(const jpeg_decompress_struct& info, const PictureRecord& picture, DetailLines& lines) {
+  lines.AddFormat("      Process: %s", info.progressive_mode ? "progressive" : "sequential");
+  lines.AddFormat("  Color space: %s", ColorSpaceName(info.jpeg_color_space));
+  if (info.num_components >= 3) {
+    const jpeg_component_info& luma = info.comp_info[0];
+    const jpeg_component_info& chroma = info.comp_info[1];
+    lines.AddFormat("     Sampling: %dx%d, %dx%d", luma.h_samp_factor, luma.v_samp_factor, chroma.h_samp_factor,
+                    chroma.v_samp_factor);
+  }
+  const PictureMetadata& metadata = picture.metadata;
+  if (metadata.dpiX > 0) lines.AddFormat("   Resolution: %.0f x %.0f dpi", metadata.dpiX, metadata.dpiY);
+  if (info.restart_interval > 0) lines.AddFormat("     Restarts: every %u blocks", info.restart_interval);
+  if (info.saw_Adobe_marker) lines.AddFormat(" Adobe marker: transform %d", info.Adobe_transform);
+  if (!metadata.icc.empty()) lines.AddFormat("  ICC profile: %zu bytes", metadata.icc.size());
+  if (!metadata.exif.empty()) lines.AddFormat("         EXIF: %zu bytes", metadata.exif.size());
+  if (!metadata.xmp.empty()) lines.AddFormat("          XMP: %zu bytes", metadata.xmp.size());
+  if (!picture.comment.empty()) lines.Add("      Comment: " + std::string(picture.comment.begin(), picture.comment.end()));
+}
+
+}  // namespace
+
+Status JpegInfo(PictureRecord& picture, const char* fileName, uint32_t) {
+  picture.typeName.Clear();
+  platform::FileView file;
+  if (!file.Open(fileName)) return Status::FileOpenError;
+  picture.fileSize = file.FileSize();
+  JpegReader reader;
+  RETURN_IF_BAD(ReadHeader(reader, file.Bytes()));
+  return DescribePicture(reader.info, picture);
+}
+
+Status JpegRead(PictureRecord& picture, const char* fileName) {
+  const ProgressScope progress(picture);
+  picture.image.Free();
+  picture.alpha.Free();
+  picture.warning.Clear();
+  platform::FileView file;
+  if (!file.Open(fileName)) return Status::FileOpenError;
+  JpegReader reader;
+  RETURN_IF_BAD(ReadHeader(reader, file.Bytes()));
+  RETURN_IF_BAD(DescribePicture(reader.info, picture));
+  if (!Guarded(reader.errors, [&] { SetOutput(reader.info, picture.thumbnailSide); })) return reader.Failure();
+  PackedImage image;
+  RETURN_IF_BAD(NewPackedImage(static_cast<int32_t>(reader.info.output_width), static_cast<int32_t>(reader.info.output_height),
+                               &picture.palette, picture.bitsPerPixel, image));
+  RETURN_IF_BAD(ReadPixels(reader, picture, image));
+  if (!file.Intact()) return Status::FileReadError;
+  picture.warning.AssignCut(reader.errors.warning);
+  picture.reduction = static_cast<int32_t>(reader.info.scale_denom / reader.info.scale_num);
+  picture.image = std::move(image);
+  return Status::Ok;
+}
+
+Status JpegWrite(PictureRecord& picture, const WriteOptions& options) {
+  const ProgressScope progress(picture);
+  if (picture.image.Empty()) return Status::MemoryAllocationError;
+  if (picture.image.Width() > JPEG_MAX_DIMENSION || picture.image.Height() > JPEG_MAX_DIMENSION) return Status::UnsuitableImage;
+  JpegWriter writer;
+  if (!writer.out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
+  RETURN_IF_BAD(WriteAll(writer, picture, options.keepMetadata && settings.PreserveEXIF != 0));
+  return CommitOutput(writer.out, options);
+}
+
+Status JpegDetails(PictureRecord& picture) {
+  picture.detailLines.Clear();
+  platform::FileView file;
+  if (!file.Open(picture.fileName.c_str())) return Status::FileOpenError;
+  JpegReader reader;
+  RETURN_IF_BAD(ReadHeader(reader, file.Bytes()));
+  TakeMetadata(reader.info, picture);
+  AddDetails(reader.info, picture, picture.detailLines);
+  return Status::Ok;
+}
+
+}  // namespace fotomill

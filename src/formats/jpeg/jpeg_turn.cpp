@@ -1,0 +1,230 @@
+// Lossless turning of JPEG pictures, a block of 8 x 8 coefficients at a time. With F(v, u) for the vertical frequency v and the
+// horizontal frequency u, a mirrored block is
+//
+//   left and right exchanged:  F(v, u) * (-1)^u
+//   top and bottom exchanged:  F(v, u) * (-1)^v
+//   rows become columns:       F(u, v); so do the quantization tables and the sampling factors
+//
+// since odd cosines change their sign about the block's middle and even ones do not. What is left is to put the blocks in
+// their new places. A rest of a block at the right or lower edge stays at that edge; it cannot become the first one.
+// Source: ITU-T T.81 (1992), annex A.3.3.
+#include "formats/jpeg/jpeg_turn.h"
+
+#include <array>
+#include <cstdlib>
+#include <utility>
+
+#include "core/limits.h"
+#include "formats/jpeg/jpeg_library.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr int kCoefficients = DCTSIZE2;
+
+// A block's coefficients: where each comes from and its sign.
+struct BlockTurn {
+  explicit BlockTurn(Turn turn) {
+    for (int i = 0; i < kCoefficients; ++i) {
+      const int v = i / DCTSIZE, u = i % DCTSIZE;
+      const int fromV = turn.swap ? u : v, fromU = turn.swap ? v : u;
+      from[i] = static_cast<uint8_t>(fromV * DCTSIZE + fromU);
+      sign[i] = (turn.flipX && fromU % 2 != 0) != (turn.flipY && fromV % 2 != 0) ? JCOEF{-1} : JCOEF{1};
+    }
+  }
+  void Apply(const JCOEF* source, JCOEF* target) const {
+    for (int i = 0; i < kCoefficients; ++i) target[i] = static_cast<JCOEF>(source[from[i]] * sign[i]);
+  }
+  std::array<uint8_t, kCoefficients> from;
+  std::array<JCOEF, kCoefficients> sign;
+};
+
+// The blocks of one component.
+struct Plane {
+  JDIMENSION fromWidth = 0, fromHeight = 0;  // in the old picture, as far as they are kept
+  JDIMENSION width = 0, height = 0;          // in the turned one
+  int across = 1, down = 1;                  // sampling factors of the turned one
+  jvirt_barray_ptr from = nullptr, to = nullptr;
+};
+
+struct JpegTurner {
+  JpegTurner() {
+    errors.Set();
+    info.err = &errors.base;
+  }
+  ~JpegTurner() {
+    jpeg_destroy_compress(&info);
+    std::free(bytes);
+  }
+  JpegTurner(const JpegTurner&) = delete;
+  JpegTurner& operator=(const JpegTurner&) = delete;
+
+  JpegReader reader;
+  JpegErrors errors;  // of writing
+  jpeg_compress_struct info = {};
+  unsigned char* bytes = nullptr;
+  unsigned long size = 0;
+  JDIMENSION width = 0, height = 0;  // of the old picture, as far as it is kept
+  std::array<Plane, MAX_COMPONENTS> planes;
+};
+
+JDIMENSION RoundedUp(JDIMENSION a, JDIMENSION b) { return (a + b - 1) / b; }
+
+// Pixels of the smallest piece that every component has whole blocks for.
+JDIMENSION PieceWidth(const jpeg_decompress_struct& info) {
+  return static_cast<JDIMENSION>(info.num_components == 1 ? 1 : info.max_h_samp_factor) * DCTSIZE;
+}
+JDIMENSION PieceHeight(const jpeg_decompress_struct& info) {
+  return static_cast<JDIMENSION>(info.num_components == 1 ? 1 : info.max_v_samp_factor) * DCTSIZE;
+}
+
+// Settles how much of the picture can be turned.
+void Measure(JpegTurner& turner, Turn turn, bool trim, TurnedJpeg& turned) {
+  const jpeg_decompress_struct& old = turner.reader.info;
+  const JDIMENSION pieceWidth = PieceWidth(old), pieceHeight = PieceHeight(old);
+  const JDIMENSION restAcross = turn.flipX ? old.image_width % pieceWidth : 0;
+  const JDIMENSION restDown = turn.flipY ? old.image_height % pieceHeight : 0;
+  turner.width = old.image_width - restAcross;
+  turner.height = old.image_height - restDown;
+  turned.trimmed = restAcross > 0 || restDown > 0;
+  if (turned.trimmed && (!trim || turner.width == 0 || turner.height == 0)) {
+    turned.obstacle = "Its size is no multiple of its blocks of " + std::to_string(pieceWidth) + " x " +
+                      std::to_string(pieceHeight) + " pixels.";
+  }
+  turned.width = static_cast<int32_t>(turn.swap ? turner.height : turner.width);
+  turned.height = static_cast<int32_t>(turn.swap ? turner.width : turner.height);
+}
+
+// Where the blocks of each component are and will be. False when there are too many for the memory that a file may take.
+bool LayOut(JpegTurner& turner, Turn turn) {
+  const jpeg_decompress_struct& old = turner.reader.info;
+  uint64_t blocks = 0;
+  for (int i = 0; i < old.num_components; ++i) {
+    const jpeg_component_info& component = old.comp_info[i];
+    Plane& plane = turner.planes[static_cast<size_t>(i)];
+    const auto kept = [](JDIMENSION pixels, int factor, int most) {
+      return RoundedUp(pixels * static_cast<JDIMENSION>(factor), static_cast<JDIMENSION>(most) * DCTSIZE);
+    };
+    plane.fromWidth = kept(turner.width, component.h_samp_factor, old.max_h_samp_factor);
+    plane.fromHeight = kept(turner.height, component.v_samp_factor, old.max_v_samp_factor);
+    plane.width = plane.fromWidth;
+    plane.height = plane.fromHeight;
+    plane.across = component.h_samp_factor;
+    plane.down = component.v_samp_factor;
+    if (turn.swap) {
+      std::swap(plane.width, plane.height);
+      std::swap(plane.across, plane.down);
+    }
+    blocks += (uint64_t{component.width_in_blocks} + MAX_SAMP_FACTOR) * (component.height_in_blocks + MAX_SAMP_FACTOR);
+  }
+  return 2 * blocks * sizeof(JBLOCK) <= limits.packedBlockBytes;
+}
+
+// Reads all coefficients; an obstacle where they are flawed, which a new file would hide.
+Status ReadBlocks(JpegTurner& turner, std::span<const uint8_t> file, TurnedJpeg& turned) {
+  JpegReader& reader = turner.reader;
+  const bool read = Guarded(reader.errors, [&] {
+    jvirt_barray_ptr* arrays = jpeg_read_coefficients(&reader.info);
+    for (int i = 0; i < reader.info.num_components; ++i) turner.planes[static_cast<size_t>(i)].from = arrays[i];
+  });
+  if (!read) return reader.Failure();
+  if (reader.errors.cutShort && reader.errors.endMissing) return Status::FileReadError;
+  turned.end = file.size() - reader.info.src->bytes_in_buffer;
+  if (reader.errors.base.num_warnings > 0) turned.obstacle = "It is damaged, though it can be shown.";
+  return Status::Ok;
+}
+
+void SetPictureForm(JpegTurner& turner, Turn turn) {
+  jpeg_decompress_struct& old = turner.reader.info;
+  jpeg_compress_struct& info = turner.info;
+  jpeg_copy_critical_parameters(&old, &info);
+  info.image_width = turn.swap ? turner.height : turner.width;
+  info.image_height = turn.swap ? turner.width : turner.height;
+  info.write_JFIF_header = info.write_Adobe_marker = FALSE;  // the old file's own segments are taken over
+  info.restart_interval = old.restart_interval;
+  info.optimize_coding = TRUE;
+  for (int i = 0; i < info.num_components; ++i) {
+    info.comp_info[i].h_samp_factor = turner.planes[static_cast<size_t>(i)].across;
+    info.comp_info[i].v_samp_factor = turner.planes[static_cast<size_t>(i)].down;
+  }
+  if (old.progressive_mode) jpeg_simple_progression(&info);
+  if (!turn.swap) return;
+  for (JQUANT_TBL* table : info.quant_tbl_ptrs) {
+    if (table == nullptr) continue;
+    for (int v = 0; v < DCTSIZE; ++v) {
+      for (int u = 0; u < v; ++u) std::swap(table->quantval[v * DCTSIZE + u], table->quantval[u * DCTSIZE + v]);
+    }
+  }
+}
+
+// Zeroed, since the rows that fill up the last group of a component are read as well.
+void RequestBlocks(JpegTurner& turner) {
+  jpeg_compress_struct& info = turner.info;
+  const auto common = static_cast<j_common_ptr>(static_cast<void*>(&info));
+  for (int i = 0; i < info.num_components; ++i) {
+    Plane& plane = turner.planes[static_cast<size_t>(i)];
+    const auto across = static_cast<JDIMENSION>(plane.across), down = static_cast<JDIMENSION>(plane.down);
+    plane.to = info.mem->request_virt_barray(common, JPOOL_IMAGE, TRUE, RoundedUp(plane.width, across) * across,
+                                             RoundedUp(plane.height, down) * down, down);
+  }
+}
+
+// Puts the turned blocks in their places, a row of new blocks after the other.
+void TurnBlocks(JpegTurner& turner, const Plane& plane, Turn turn, const BlockTurn& block) {
+  const auto old = static_cast<j_common_ptr>(static_cast<void*>(&turner.reader.info));
+  const auto made = static_cast<j_common_ptr>(static_cast<void*>(&turner.info));
+  const auto fromRow = [&](JDIMENSION row) { return *old->mem->access_virt_barray(old, plane.from, row, 1, FALSE); };
+  const auto toRow = [&](JDIMENSION row) { return *made->mem->access_virt_barray(made, plane.to, row, 1, TRUE); };
+  const auto source = [](bool flip, JDIMENSION place, JDIMENSION count) { return flip ? count - 1 - place : place; };
+  for (JDIMENSION y = 0; y < plane.height; ++y) {
+    JBLOCKROW target = toRow(y);
+    if (!turn.swap) {
+      const JBLOCKROW row = fromRow(source(turn.flipY, y, plane.fromHeight));
+      for (JDIMENSION x = 0; x < plane.width; ++x) block.Apply(row[source(turn.flipX, x, plane.fromWidth)], target[x]);
+      continue;
+    }
+    const JDIMENSION column = source(turn.flipX, y, plane.fromWidth);
+    for (JDIMENSION x = 0; x < plane.width; ++x) block.Apply(fromRow(source(turn.flipY, x, plane.fromHeight))[column], target[x]);
+  }
+}
+
+Status WriteTurned(JpegTurner& turner, Turn turn) {
+  const BlockTurn block(turn);
+  const bool written = Guarded(turner.errors, [&] {
+    turner.reader.info.err = &turner.errors.base;  // its blocks are asked for here, and fail into here
+    jpeg_create_compress(&turner.info);
+    jpeg_mem_dest(&turner.info, &turner.bytes, &turner.size);
+    SetPictureForm(turner, turn);
+    RequestBlocks(turner);
+    std::array<jvirt_barray_ptr, MAX_COMPONENTS> arrays = {};
+    for (size_t i = 0; i < arrays.size(); ++i) arrays[i] = turner.planes[i].to;
+    jpeg_write_coefficients(&turner.info, arrays.data());
+    for (int i = 0; i < turner.info.num_components; ++i) TurnBlocks(turner, turner.planes[static_cast<size_t>(i)], turn, block);
+    jpeg_finish_compress(&turner.info);
+  });
+  if (written) return Status::Ok;
+  const Status status = turner.errors.Meaning(static_cast<j_common_ptr>(static_cast<void*>(&turner.info)));
+  return status == Status::MemoryAllocationError ? status : Status::UnsuitableImage;
+}
+
+}  // namespace
+
+Status TurnJpeg(std::span<const uint8_t> file, Orientation orientation, bool trim, TurnedJpeg& turned) {
+  turned = {};
+  const Turn turn = TurnOf(orientation);
+  JpegTurner turner;
+  RETURN_IF_BAD(ReadJpegHeader(turner.reader, file));
+  Measure(turner, turn, trim, turned);
+  if (turned.obstacle.empty() && !LayOut(turner, turn)) turned.obstacle = "It is too large for that.";
+  if (!turned.obstacle.empty()) return Status::Ok;
+  RETURN_IF_BAD(ReadBlocks(turner, file, turned));
+  if (!turned.obstacle.empty()) return Status::Ok;
+  const Status status = WriteTurned(turner, turn);
+  if (status == Status::Ok) turned.file.assign(turner.bytes, turner.bytes + turner.size);
+  if (status != Status::UnsuitableImage) return status;
+  turned.obstacle = "Its kind of JPEG cannot be written again as it is.";
+  return Status::Ok;
+}
+
+}  // namespace fotomill

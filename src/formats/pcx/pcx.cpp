@@ -1,0 +1,310 @@
+// PC Paintbrush (PCX), little-endian.
+//
+//   offset size  field
+//        0    1  manufacturer, always 10
+//        1    1  version; 3: the fixed sixteen colours; from 5 on an 8-bit file may end in a palette; written 5
+//        2    1  encoding, written 1; not read: data are always run-length coded
+//        3    1  bits per pixel and plane
+//        4    8  xmin, ymin, xmax, ymax, the corners; written 0, 0, width - 1, height - 1
+//       12    4  two resolutions, written 300
+//       16   48  palette of sixteen colours
+//       64    1  reserved
+//       65    1  planes
+//       66    2  bytes per line and plane, used as stored; written without rounding up
+//       68    2  palette information, written 1, or 0 with 24 bits
+//       70   58  filler
+//      128       lines from the top, each with its planes one after the other
+//   end - 769    12 and a palette of 256 colours, with 8 bits
+//
+// Palettes are red, green, blue. A byte of 0xC0 or more counts in its low six bits how often the byte after it comes;
+// any other byte stands for itself.
+//
+// The reader carries runs on from line to line, and takes two bits in one plane (CGA) beside the combinations that it
+// writes. The writer codes every plane of every line on its own, and leaves the last byte of a run to the token after
+// it. Source: ZSoft Corporation, "PCX Technical Reference Manual" (1991).
+#include "formats/pcx/pcx.h"
+
+#include <algorithm>
+#include <array>
+#include <cstring>
+
+#include "core/byte_reader.h"
+#include "core/byte_writer.h"
+#include "formats/pcx/pcx_runs.h"
+#include "platform/file_view.h"
+#include "processing/pixel_rows.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr uint64_t kHeaderSize = 128;
+constexpr uint8_t kManufacturer = 10;
+constexpr uint8_t kVersionFixedColors = 3, kVersionTrailer = 5;
+constexpr uint16_t kResolution = 300;
+constexpr size_t kHeaderPaletteSize = 48;
+constexpr uint8_t kTrailerMark = 12;
+constexpr uint64_t kTrailerSize = 1 + 768;
+
+// The palette of version 3 files, which hold none.
+constexpr std::array<uint8_t, kHeaderPaletteSize> kFixedColors = {
+    0x00, 0x00, 0x00, 0x00, 0x00, 0xAA, 0x00, 0xAA, 0x00, 0x00, 0xAA, 0xAA, 0xAA, 0x00, 0x00, 0xAA,
+    0x00, 0xAA, 0xAA, 0x55, 0x00, 0xAA, 0xAA, 0xAA, 0x55, 0x55, 0x55, 0x55, 0x55, 0xFF, 0x55, 0xFF,
+    0x55, 0x55, 0xFF, 0xFF, 0xFF, 0x55, 0x55, 0xFF, 0x55, 0xFF, 0xFF, 0xFF, 0x55, 0xFF, 0xFF, 0xFF};
+
+struct PcxHeader {
+  uint8_t version = 0;
+  uint8_t bitsPerPlane = 0;
+  uint8_t planes = 0;
+  int32_t width = 0, height = 0;  // 1 to 65536 when valid
+  uint16_t bytesPerLine = 0;      // of one plane
+  std::array<uint8_t, kHeaderPaletteSize> palette{};
+
+  size_t LineSize() const { return size_t{bytesPerLine} * planes; }
+};
+
+// Turns a decoded line of `header.LineSize()` bytes into a whole row of the picture, padding included. Pixels that the
+// line does not hold become 0.
+using SpreadRow = void (*)(std::span<const uint8_t> line, const PcxHeader& header, std::span<uint8_t> row);
+
+void CopyRow(std::span<const uint8_t> line, const PcxHeader&, std::span<uint8_t> row) {
+  const size_t count = std::min(line.size(), row.size());
+  std::memcpy(row.data(), line.data(), count);
+  std::memset(row.data() + count, 0, row.size() - count);
+}
+
+// One bit of each of 2 to 4 planes makes a 4-bit pixel, the first plane its lowest bit.
+void SpreadBitPlanes(std::span<const uint8_t> line, const PcxHeader& header, std::span<uint8_t> row) {
+  const size_t count = static_cast<size_t>(std::min(header.width, header.bytesPerLine * 8));
+  std::memset(row.data(), 0, row.size());
+  MergeBitPlanes(line.data(), count, header.planes, header.bytesPerLine, row.data());
+}
+
+// Four 2-bit pixels of a byte become four 4-bit ones.
+void SpreadPairs(std::span<const uint8_t> line, const PcxHeader& header, std::span<uint8_t> row) {
+  std::memset(row.data(), 0, row.size());
+  const int32_t width = std::min(header.width, header.bytesPerLine * 4);
+  for (int32_t x = 0; x < width; ++x) {
+    const int32_t index = line[static_cast<size_t>(x / 4)] >> (6 - x % 4 * 2) & 3;
+    row[static_cast<size_t>(x / 2)] |= static_cast<uint8_t>(x % 2 == 0 ? index << 4 : index);
+  }
+}
+
+// A red, a green and a blue plane become pixels of blue, green, red.
+void MergeColorPlanes(std::span<const uint8_t> line, const PcxHeader& header, std::span<uint8_t> row) {
+  const size_t count = std::min<size_t>(header.width, header.bytesPerLine);
+  const uint8_t* red = line.data();
+  const uint8_t* green = red + header.bytesPerLine;
+  const uint8_t* blue = green + header.bytesPerLine;
+  MergeColors(blue, green, red, count, row.data());
+  std::memset(row.data() + 3 * count, 0, row.size() - 3 * count);
+}
+
+// The arrangements of planes that can be read, and what they are read as.
+struct Arrangement {
+  uint8_t bitsPerPlane;
+  uint8_t planes;
+  int32_t depth;
+  SpreadRow spread;
+};
+// clang-format off
+constexpr Arrangement kArrangements[] = {
+    //bits planes depth spread
+    {1,    1,     1,    CopyRow},
+    {1,    2,     2,    SpreadBitPlanes},
+    {1,    3,     3,    SpreadBitPlanes},
+    {1,    4,     4,    SpreadBitPlanes},
+    {2,    1,     2,    SpreadPairs},
+    {4,    1,     4,    CopyRow},
+    {8,    1,     8,    CopyRow},
+    {8,    3,     24,   MergeColorPlanes},
+};
+// clang-format on
+
+// Null for a combination that is not in the table.
+const Arrangement* FindArrangement(const PcxHeader& header) {
+  for (const Arrangement& row : kArrangements) {
+    if (row.bitsPerPlane == header.bitsPerPlane && row.planes == header.planes) return &row;
+  }
+  return nullptr;
+}
+
+// Ok, or DamagedFile when the header is short, of another format, or leaves nothing to decode.
+Status ParseHeader(std::span<const uint8_t> file, PcxHeader& header) {
+  ByteReader bytes(file);
+  const uint8_t manufacturer = bytes.U8();
+  header.version = bytes.U8();
+  bytes.Skip(1);  // encoding
+  header.bitsPerPlane = bytes.U8();
+  const uint16_t xMin = bytes.Le16(), yMin = bytes.Le16();
+  header.width = bytes.Le16() - xMin + 1;
+  header.height = bytes.Le16() - yMin + 1;
+  bytes.Skip(4);  // resolutions
+  const std::span<const uint8_t> palette = bytes.Take(kHeaderPaletteSize);
+  std::copy(palette.begin(), palette.end(), header.palette.begin());
+  bytes.Skip(1);
+  header.planes = bytes.U8();
+  header.bytesPerLine = bytes.Le16();
+  bytes.Seek(kHeaderSize);
+  const bool sizesValid = header.width > 0 && header.height > 0 && header.bytesPerLine > 0;
+  const bool valid = bytes.Ok() && manufacturer == kManufacturer && sizesValid && FindArrangement(header) != nullptr;
+  return valid ? Status::Ok : Status::DamagedFile;
+}
+
+// Fills `palette` with what the header's version and depth call for. FileReadError when a palette at the end is there
+// but cannot be read.
+Status ReadPalette(const platform::FileView& file, const PcxHeader& header, int32_t depth, Palette& palette) {
+  MakeDefaultPalette(&palette, nullptr, depth == 24 ? kDisplayPalette : kBlackAndWhitePalette);
+  if (depth == 1 || depth == 24) return Status::Ok;
+  if (depth == 8 && header.version >= kVersionTrailer && file.FileSize() >= kTrailerSize) {
+    std::array<uint8_t, kTrailerSize> trailer;
+    if (!file.ReadAt(file.FileSize() - kTrailerSize, trailer)) return Status::FileReadError;
+    if (trailer[0] == kTrailerMark) {
+      std::copy(trailer.begin() + 1, trailer.end(), palette.begin());
+      return Status::Ok;
+    }
+  }
+  const auto& colors = header.version == kVersionFixedColors ? kFixedColors : header.palette;
+  std::copy(colors.begin(), colors.end(), palette.begin());
+  return Status::Ok;
+}
+
+// Parses the header and fills the record's facts.
+Status DescribePicture(const platform::FileView& file, PictureRecord& picture, PcxHeader& header) {
+  picture.typeName.Clear();
+  picture.fileSize = file.FileSize();
+  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
+  picture.width = header.width;
+  picture.height = header.height;
+  picture.bitsPerPixel = FindArrangement(header)->depth;
+  picture.imageBytes = (picture.bitsPerPixel == 24 ? header.LineSize() : header.bytesPerLine) * uint64_t(header.height);
+  picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
+  return ReadPalette(file, header, picture.bitsPerPixel, picture.palette);
+}
+
+// What the writer stores for a picture.
+struct PcxLayout {
+  int32_t depth = 0;  // 1, 2, 3, 4, 8 or 24
+  uint8_t bitsPerPlane = 0;
+  uint8_t planes = 0;
+  uint16_t bytesPerLine = 0;  // of one plane
+};
+
+// UnsuitableImage when a size does not fit its field.
+Status ChooseLayout(const PictureRecord& picture, PcxLayout& layout) {
+  const PackedImage& image = picture.image;
+  const bool planar = image.Bits() == 4 && picture.bitsPerPixel >= 2 && picture.bitsPerPixel <= 4;
+  layout.depth = planar ? picture.bitsPerPixel : image.Bits();
+  layout.bitsPerPlane = layout.depth <= 4 ? 1 : 8;
+  layout.planes = static_cast<uint8_t>(layout.depth == 24 ? 3 : layout.depth <= 4 ? layout.depth : 1);
+  const int32_t bytesPerLine = layout.depth <= 4 ? (image.Width() + 7) / 8 : image.Width();
+  if (bytesPerLine > UINT16_MAX || image.Width() - 1 > UINT16_MAX || image.Height() - 1 > UINT16_MAX) {
+    return Status::UnsuitableImage;
+  }
+  layout.bytesPerLine = static_cast<uint16_t>(bytesPerLine);
+  return Status::Ok;
+}
+
+void WriteHeader(ByteWriter& out, const PcxLayout& layout, const PictureRecord& picture) {
+  out.U8(kManufacturer);
+  out.U8(kVersionTrailer);
+  out.U8(1);
+  out.U8(layout.bitsPerPlane);
+  out.Zeros(4);
+  out.Le16(static_cast<uint16_t>(picture.image.Width() - 1));
+  out.Le16(static_cast<uint16_t>(picture.image.Height() - 1));
+  out.Le16(kResolution);
+  out.Le16(kResolution);
+  out.Bytes(std::span(picture.palette).first(kHeaderPaletteSize));
+  out.U8(0);
+  out.U8(layout.planes);
+  out.Le16(layout.bytesPerLine);
+  out.Le16(layout.depth == 24 ? 0 : 1);
+  out.Zeros(kHeaderSize - 70);
+}
+
+// Takes the planes of a row apart, `bytesPerLine` bytes each, one after the other.
+using TakePlanes = void (*)(std::span<const uint8_t> row, int32_t width, const PcxLayout& layout, std::span<uint8_t> planes);
+
+void TakePlane(std::span<const uint8_t> row, int32_t, const PcxLayout&, std::span<uint8_t> planes) {
+  std::copy_n(row.begin(), planes.size(), planes.begin());
+}
+
+void TakeBitPlanes(std::span<const uint8_t> row, int32_t width, const PcxLayout& layout, std::span<uint8_t> planes) {
+  SplitBitPlanes(row.data(), static_cast<size_t>(width), layout.planes, layout.bytesPerLine, planes.data());
+}
+
+void TakeColorPlanes(std::span<const uint8_t> row, int32_t width, const PcxLayout&, std::span<uint8_t> planes) {
+  const size_t count = static_cast<size_t>(width);
+  uint8_t* red = planes.data();
+  SplitColors(row.data(), count, red + 2 * count, red + count, red);
+}
+
+void WriteLines(ByteWriter& out, const PcxLayout& layout, const PictureRecord& picture, std::span<uint8_t> planes) {
+  const PackedImage& image = picture.image;
+  const TakePlanes take = layout.depth == 24 ? TakeColorPlanes : layout.planes > 1 ? TakeBitPlanes : TakePlane;
+  for (int32_t y = 0; y < image.Height() && !out.Failed(); ++y) {
+    picture.ReportRow(y);
+    take(image.Row(y), image.Width(), layout, planes);
+    for (size_t begin = 0; begin < planes.size(); begin += layout.bytesPerLine) {
+      out.Used(EncodePcxPlane(planes.subspan(begin, layout.bytesPerLine), out.Reserve(2 * size_t{layout.bytesPerLine})));
+    }
+  }
+}
+
+}  // namespace
+
+Status PcxInfo(PictureRecord& picture, const char* fileName, uint32_t) {
+  platform::FileView file;
+  if (!file.OpenHead(fileName, kHeaderSize)) return Status::FileOpenError;
+  PcxHeader header;
+  return DescribePicture(file, picture, header);
+}
+
+Status PcxRead(PictureRecord& picture, const char* fileName) {
+  const ProgressScope progress(picture);
+  picture.image.Free();
+  picture.alpha.Free();
+  platform::FileView file;
+  if (!file.Open(fileName)) return Status::FileOpenError;
+  PcxHeader header;
+  RETURN_IF_BAD(DescribePicture(file, picture, header));
+
+  PackedImage image;
+  platform::MemoryBlock line;
+  RETURN_IF_BAD(
+      NewPackedImage(picture.width, picture.height, &picture.palette, picture.bitsPerPixel, image, platform::Fill::Unset));
+  if (!line.Allocate(header.LineSize() + PcxLineDecoder::kSlack)) return Status::MemoryAllocationError;
+  const SpreadRow spread = FindArrangement(header)->spread;
+  const std::span<const uint8_t> decoded = line.Bytes().first(header.LineSize());
+  PcxLineDecoder decoder(file.Bytes().subspan(kHeaderSize));
+  for (int32_t y = 0; y < header.height; ++y) {
+    if (!decoder.Decode(line.Data(), header.LineSize())) return Status::FileReadError;
+    spread(decoded, header, image.Row(y));
+    file.DropBefore(static_cast<uint64_t>(decoder.Next() - file.Bytes().data()));
+    picture.ReportRow(y);
+  }
+  if (!file.Intact()) return Status::FileReadError;
+  picture.image = std::move(image);
+  return Status::Ok;
+}
+
+Status PcxWrite(PictureRecord& picture, const WriteOptions& options) {
+  const ProgressScope progress(picture);
+  if (picture.image.Empty()) return Status::MemoryAllocationError;
+  PcxLayout layout;
+  RETURN_IF_BAD(ChooseLayout(picture, layout));
+  platform::MemoryBlock planes;
+  if (!planes.Allocate(uint64_t{layout.bytesPerLine} * layout.planes)) return Status::MemoryAllocationError;
+  ByteWriter out;
+  if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
+  WriteHeader(out, layout, picture);
+  WriteLines(out, layout, picture, planes.Bytes());
+  if (layout.depth == 8) {
+    out.U8(kTrailerMark);
+    out.Bytes(picture.palette);
+  }
+  return CommitOutput(out, options);
+}
+
+}  // namespace fotomill

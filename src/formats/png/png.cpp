@@ -1,0 +1,500 @@
+// Portable Network Graphics (PNG), big-endian; png_write.cpp writes.
+//
+//   signature 89 50 4E 47 0D 0A 1A 0A, then chunks of length, type, data and CRC:
+//   IHDR  width, height (4 bytes each), bit depth, colour type (1 colour, 2 palette bit, 4 alpha), 0, 0, interlace
+//   PLTE, tRNS, pHYs, gAMA, iCCP, eXIf, tEXt, zTXt, iTXt, acTL ..., IDAT (deflated rows), IEND
+//
+// What the reader makes of it: palettes and greys of 1, 2, 4 and 8 bits without transparency keep their depth (greys with
+// a grey palette); everything else becomes 24 bits, with an alpha plane where there is an alpha channel or a transparent
+// colour. 16-bit samples are rounded to 8. Gamma is told, not applied. Of an animation (acTL) the default picture is shown.
+// EXIF, XMP, ICC profile and resolution travel with the picture.
+//
+// libpng reads everything in front of the pixels. Pixels that are not interlaced are inflated by libdeflate as a whole and
+// unfiltered here, which takes half the time; interlaced ones, rare forms and whatever looks damaged are libpng's.
+// Source: W3C, "Portable Network Graphics (PNG) Specification (Third Edition)", 2025; libpng manual.
+#include "formats/png/png.h"
+
+#include <algorithm>
+#include <cmath>
+#include <cstring>
+#include <string>
+#include <vector>
+
+#include "containers/png_chunks.h"
+#include "core/byte_reader.h"
+#include "core/limits.h"
+#include "formats/png/png_library.h"
+#include "formats/png/png_pixels.h"
+#include "platform/file_view.h"
+#include "processing/pixel_rows.h"
+#include "settings/settings.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr png_uint_32 kMostSide = 0x7fffffff;
+constexpr png_alloc_size_t kMostChunkMemory = 64u << 20;
+
+// A file being read, with the library's two structures.
+struct PngReader {
+  explicit PngReader(std::span<const uint8_t> data) : file(data), bytes(data) {
+    png = png_create_read_struct(PNG_LIBPNG_VER_STRING, nullptr, OnPngError, OnPngWarning);
+    if (png != nullptr) info = png_create_info_struct(png);
+  }
+  ~PngReader() { png_destroy_read_struct(&png, &info, nullptr); }
+  PngReader(const PngReader&) = delete;
+  PngReader& operator=(const PngReader&) = delete;
+  bool Ready() const { return info != nullptr; }
+  // What a failed library call means.
+  Status Failure() const { return bytes.Ok() ? Status::DamagedFile : Status::FileReadError; }
+
+  std::span<const uint8_t> file;
+  ByteReader bytes;
+  png_structp png = nullptr;
+  png_infop info = nullptr;
+};
+
+void ReadBytes(png_structp png, png_bytep target, size_t count) {
+  auto* reader = static_cast<PngReader*>(png_get_io_ptr(png));
+  const auto bytes = reader->bytes.Take(count);
+  if (bytes.size() != count) png_error(png, "cut short");
+  std::memcpy(target, bytes.data(), count);
+}
+
+// How the rows come out of the library.
+enum class RowForm {
+  Direct,    // as the picture stores them
+  TwoBits,   // one index a byte, to be packed into 4 bits
+  WithAlpha  // blue, green, red, alpha
+};
+
+struct PngLayout {
+  int32_t width = 0, height = 0;
+  int32_t bitsPerPixel = 0;
+  bool interlaced = false;
+  RowForm rows = RowForm::Direct;
+};
+
+// Whether the chunks in front of the pixels lie in the file: for one that only claims a size the library would make room.
+bool HeadLiesInFile(std::span<const uint8_t> file) {
+  constexpr uint64_t kSignature = 8, kTypeAndCrc = 8;
+  ByteReader bytes(file);
+  bytes.Skip(kSignature);
+  while (bytes.Ok()) {
+    const uint32_t size = bytes.Be32();
+    if (bytes.Match("IDAT")) return true;
+    bytes.Skip(kTypeAndCrc + size);
+  }
+  return false;
+}
+
+// Reads everything before the pixels and sets up the conversions.
+Status ReadHeader(PngReader& reader) {
+  if (!reader.Ready()) return Status::MemoryAllocationError;
+  if (png_sig_cmp(reader.bytes.Peek(8).data(), 0, reader.bytes.Peek(8).size()) != 0) return Status::DamagedFile;
+  if (!HeadLiesInFile(reader.file)) return Status::FileReadError;
+  const bool read = PngGuarded(reader.png, [&] {
+    png_set_read_fn(reader.png, &reader, ReadBytes);
+    png_set_user_limits(reader.png, kMostSide, kMostSide);
+    png_set_chunk_malloc_max(reader.png, kMostChunkMemory);
+    png_read_info(reader.png, reader.info);
+  });
+  return read ? Status::Ok : reader.Failure();
+}
+
+PngLayout ChooseLayout(const PngReader& reader) {
+  const png_byte type = png_get_color_type(reader.png, reader.info);
+  const png_byte depth = png_get_bit_depth(reader.png, reader.info);
+  const bool transparent = (type & PNG_COLOR_MASK_ALPHA) != 0 || png_get_valid(reader.png, reader.info, PNG_INFO_tRNS) != 0;
+  const bool indexed = type == PNG_COLOR_TYPE_PALETTE || type == PNG_COLOR_TYPE_GRAY;
+  PngLayout layout;
+  layout.width = static_cast<int32_t>(png_get_image_width(reader.png, reader.info));
+  layout.height = static_cast<int32_t>(png_get_image_height(reader.png, reader.info));
+  layout.interlaced = png_get_interlace_type(reader.png, reader.info) != PNG_INTERLACE_NONE;
+  layout.bitsPerPixel = indexed && !transparent ? std::min<int32_t>(depth, 8) : 24;
+  layout.rows = transparent ? RowForm::WithAlpha : layout.bitsPerPixel == 2 ? RowForm::TwoBits : RowForm::Direct;
+  return layout;
+}
+
+void SetConversions(const PngReader& reader, const PngLayout& layout) {
+  png_set_scale_16(reader.png);
+  if (layout.rows == RowForm::TwoBits) png_set_packing(reader.png);
+  if (layout.bitsPerPixel == 24) {
+    png_set_expand(reader.png);
+    png_set_gray_to_rgb(reader.png);
+    png_set_bgr(reader.png);
+    if (layout.rows == RowForm::WithAlpha) png_set_add_alpha(reader.png, 255, PNG_FILLER_AFTER);
+  }
+  png_set_interlace_handling(reader.png);
+  png_read_update_info(reader.png, reader.info);
+}
+
+void TakePalette(const PngReader& reader, const PngLayout& layout, Palette& palette) {
+  if (layout.bitsPerPixel == 24) {
+    MakeDefaultPalette(&palette, nullptr, kDisplayPalette);
+    return;
+  }
+  palette.fill(0);
+  png_colorp colors = nullptr;
+  int count = 0;
+  if (png_get_PLTE(reader.png, reader.info, &colors, &count) != 0 &&
+      png_get_color_type(reader.png, reader.info) == PNG_COLOR_TYPE_PALETTE) {
+    for (int i = 0; i < count && i < 256; ++i) {
+      const auto place = 3 * static_cast<size_t>(i);
+      palette[place] = colors[i].red;
+      palette[place + 1] = colors[i].green;
+      palette[place + 2] = colors[i].blue;
+    }
+    return;
+  }
+  const int levels = 1 << layout.bitsPerPixel;
+  for (int i = 0; i < 3 * levels; ++i) palette[static_cast<size_t>(i)] = static_cast<uint8_t>(i / 3 * 255 / (levels - 1));
+}
+
+void Assign(std::vector<uint8_t>& block, const uint8_t* data, size_t size) {
+  block.clear();
+  if (data != nullptr && size <= limits.metadataBytes) block.assign(data, data + size);
+}
+
+void TakeTexts(const PngReader& reader, PictureRecord& picture) {
+  png_textp texts = nullptr;
+  int count = 0;
+  png_get_text(reader.png, reader.info, &texts, &count);
+  for (int i = 0; i < count; ++i) {
+    const size_t size = std::max(texts[i].text_length, texts[i].itxt_length);
+    const auto* text = reinterpret_cast<const uint8_t*>(texts[i].text);
+    if (std::strcmp(texts[i].key, kPngXmpKeyword) == 0) Assign(picture.metadata.xmp, text, size);
+    if (std::strcmp(texts[i].key, "Comment") == 0) Assign(picture.comment, text, size);
+  }
+}
+
+void TakeMetadata(const PngReader& reader, PictureRecord& picture) {
+  picture.metadata = {};
+  png_bytep exif = nullptr;
+  png_uint_32 exifSize = 0;
+  if (png_get_eXIf_1(reader.png, reader.info, &exifSize, &exif) != 0) Assign(picture.metadata.exif, exif, exifSize);
+  png_charp name = nullptr;
+  int method = 0;
+  png_bytep profile = nullptr;
+  png_uint_32 profileSize = 0;
+  if (png_get_iCCP(reader.png, reader.info, &name, &method, &profile, &profileSize) != 0) {
+    Assign(picture.metadata.icc, profile, profileSize);
+  }
+  TakeTexts(reader, picture);
+  png_uint_32 x = 0, y = 0;
+  int unit = 0;
+  if (png_get_pHYs(reader.png, reader.info, &x, &y, &unit) != 0 && unit == PNG_RESOLUTION_METER) {
+    picture.metadata.dpiX = x / kPngInchesPerMetre;
+    picture.metadata.dpiY = y / kPngInchesPerMetre;
+  }
+}
+
+// The number of frames that an animation's acTL chunk names, 1 for a still picture. It stands before the pixels.
+int32_t FrameCount(std::span<const uint8_t> file) {
+  PngChunks chunks(file);
+  PngChunk chunk;
+  while (chunks.Next(chunk) && chunk.type != "IDAT") {
+    if (chunk.type == "acTL") return static_cast<int32_t>(std::clamp<uint32_t>(ByteReader(chunk.data).Be32(), 1, 1 << 20));
+  }
+  return 1;
+}
+
+// Fills the facts.
+Status Describe(PngReader& reader, std::span<const uint8_t> file, PngLayout& layout, PictureRecord& picture) {
+  RETURN_IF_BAD(ReadHeader(reader));
+  layout = ChooseLayout(reader);
+  const int32_t frames = FrameCount(file);
+  picture.pageCount = settings.RecognizeAPNG != 0 ? frames : 1;
+  picture.simplified = frames > 1 || png_get_bit_depth(reader.png, reader.info) > 8;
+  picture.typeName.AssignCut(picture.pageCount > 1 ? "Animated PNG" : "Portable Network Graphics");
+  picture.width = layout.width;
+  picture.height = layout.height;
+  picture.bitsPerPixel = layout.bitsPerPixel;
+  const bool alpha = layout.rows == RowForm::WithAlpha;
+  picture.alphaFlags = static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (alpha ? kHasAlpha : 0));
+  picture.imageBytes = EstimateImageBytes(layout.width, layout.height, layout.bitsPerPixel);
+  TakePalette(reader, layout, picture.palette);
+  TakeMetadata(reader, picture);
+  return Status::Ok;
+}
+
+void PackNibbles(const uint8_t* source, uint8_t* row, int32_t width) {
+  for (int32_t x = 0; x < width; x += 2) {
+    *row++ = static_cast<uint8_t>(source[x] << 4 | (x + 1 < width ? source[x + 1] : 0));
+  }
+}
+
+struct PngTarget {
+  PackedImage image, alpha;
+};
+
+void StoreRow(const PngLayout& layout, const uint8_t* source, int32_t y, PngTarget& target) {
+  if (layout.rows == RowForm::WithAlpha) {
+    SplitAlpha(source, static_cast<size_t>(layout.width), target.image.Row(y).data(), target.alpha.Row(y).data());
+  } else {
+    PackNibbles(source, target.image.Row(y).data(), layout.width);
+  }
+}
+
+// Rows that come in order: straight into the picture, or through one row.
+Status ReadInOrder(PngReader& reader, const PngLayout& layout, const PictureRecord& picture, PngTarget& target) {
+  std::vector<uint8_t> row(png_get_rowbytes(reader.png, reader.info));
+  const bool read = PngGuarded(reader.png, [&] {
+    for (int32_t y = 0; y < layout.height; ++y) {
+      const bool direct = layout.rows == RowForm::Direct;
+      png_read_row(reader.png, direct ? target.image.Row(y).data() : row.data(), nullptr);
+      if (!direct) StoreRow(layout, row.data(), y, target);
+      picture.ReportRow(y);
+    }
+  });
+  return read ? Status::Ok : reader.Failure();
+}
+
+// Interlaced rows come in seven passes, each of which fills in pixels, so all of them must be held.
+Status ReadInterlaced(PngReader& reader, const PngLayout& layout, const PictureRecord& picture, PngTarget& target) {
+  const uint64_t rowBytes = png_get_rowbytes(reader.png, reader.info);
+  platform::MemoryBlock buffer;
+  if (layout.rows != RowForm::Direct && !buffer.Allocate(rowBytes * static_cast<uint64_t>(layout.height))) {
+    return Status::MemoryAllocationError;
+  }
+  const auto rowAt = [&](int32_t y) {
+    return buffer.Empty() ? target.image.Row(y).data() : buffer.Data() + rowBytes * static_cast<uint64_t>(y);
+  };
+  const bool read = PngGuarded(reader.png, [&] {
+    constexpr int kPasses = 7;
+    for (int pass = 0; pass < kPasses; ++pass) {
+      for (int32_t y = 0; y < layout.height; ++y) png_read_row(reader.png, rowAt(y), nullptr);
+      picture.ReportRow(layout.height / kPasses * pass);
+    }
+  });
+  if (!read) return reader.Failure();
+  for (int32_t y = 0; y < layout.height; ++y) {
+    if (!buffer.Empty()) StoreRow(layout, rowAt(y), y, target);
+    picture.ReportRow(y);
+  }
+  return Status::Ok;
+}
+
+// How a whole row of the file, free of its filter, becomes the picture's.
+using StoreFileRow = void (*)(const uint8_t* source, size_t width, const PngReader& reader, uint8_t* image, uint8_t* alpha);
+
+uint8_t HighByte(const uint8_t* sample) { return static_cast<uint8_t>(((sample[0] << 8 | sample[1]) * 255u + 32895) >> 16); }
+
+template <int kBits>
+void CopyPixels(const uint8_t* source, size_t width, const PngReader&, uint8_t* image, uint8_t*) {
+  std::memcpy(image, source, (width * kBits + 7) / 8);
+}
+
+template <size_t kSamples, size_t kBytes>  // grey or colours, with alpha when the number is even; samples of one or two bytes
+void StoreSamples(const uint8_t* source, size_t width, const PngReader&, uint8_t* image, uint8_t* alpha) {
+  const auto sample = [](const uint8_t* at) { return kBytes == 1 ? *at : HighByte(at); };
+  constexpr size_t kColors = kSamples < 3 ? 1 : 3;
+  for (size_t x = 0; x < width; ++x, source += kSamples * kBytes, image += 3) {
+    image[0] = sample(source + (kColors - 1) * kBytes);
+    image[1] = sample(source + (kColors - 1) / 2 * kBytes);
+    image[2] = sample(source);
+    if constexpr (kSamples % 2 == 0) alpha[x] = sample(source + kColors * kBytes);
+  }
+}
+
+void StoreColors(const uint8_t* source, size_t width, const PngReader&, uint8_t* image, uint8_t*) {
+  SwapColors(source, width, image);
+}
+
+void StoreDeepGreys(const uint8_t* source, size_t width, const PngReader&, uint8_t* image, uint8_t*) {
+  for (size_t x = 0; x < width; ++x) image[x] = HighByte(source + 2 * x);
+}
+
+// Colours of a palette with alpha.
+void StorePaletteAlpha(const uint8_t* source, size_t width, const PngReader& reader, uint8_t* image, uint8_t* alpha) {
+  png_bytep opacities = nullptr;
+  png_colorp colors = nullptr;
+  int opacityCount = 0, count = 0;
+  png_get_tRNS(reader.png, reader.info, &opacities, &opacityCount, nullptr);
+  png_get_PLTE(reader.png, reader.info, &colors, &count);
+  for (size_t x = 0; x < width; ++x, image += 3) {
+    const int index = source[x];
+    const png_color color = index < count ? colors[index] : png_color{};
+    image[0] = color.blue;
+    image[1] = color.green;
+    image[2] = color.red;
+    alpha[x] = index < opacityCount ? opacities[index] : uint8_t{255};
+  }
+}
+
+// The forms that are worth a way of their own; the library takes the rest.
+StoreFileRow FileRowStore(const PngReader& reader, const PngLayout& layout) {
+  struct Form {
+    int type, depth;
+    bool transparentColor;
+    StoreFileRow store;
+  };
+  constexpr Form kForms[] = {
+      {PNG_COLOR_TYPE_GRAY, 1, false, CopyPixels<1>},
+      {PNG_COLOR_TYPE_GRAY, 4, false, CopyPixels<4>},
+      {PNG_COLOR_TYPE_GRAY, 8, false, CopyPixels<8>},
+      {PNG_COLOR_TYPE_GRAY, 16, false, StoreDeepGreys},
+      {PNG_COLOR_TYPE_PALETTE, 1, false, CopyPixels<1>},
+      {PNG_COLOR_TYPE_PALETTE, 4, false, CopyPixels<4>},
+      {PNG_COLOR_TYPE_PALETTE, 8, false, CopyPixels<8>},
+      {PNG_COLOR_TYPE_PALETTE, 8, true, StorePaletteAlpha},
+      {PNG_COLOR_TYPE_GRAY_ALPHA, 8, false, StoreSamples<2, 1>},
+      {PNG_COLOR_TYPE_GRAY_ALPHA, 16, false, StoreSamples<2, 2>},
+      {PNG_COLOR_TYPE_RGB, 8, false, StoreColors},
+      {PNG_COLOR_TYPE_RGB, 16, false, StoreSamples<3, 2>},
+      {PNG_COLOR_TYPE_RGB_ALPHA, 8, false, StoreSamples<4, 1>},
+      {PNG_COLOR_TYPE_RGB_ALPHA, 16, false, StoreSamples<4, 2>},
+  };
+  const bool transparentColor = png_get_valid(reader.png, reader.info, PNG_INFO_tRNS) != 0;
+  for (const Form& form : kForms) {
+    const bool matches = form.type == png_get_color_type(reader.png, reader.info) &&
+                         form.depth == png_get_bit_depth(reader.png, reader.info) && form.transparentColor == transparentColor;
+    if (matches && !layout.interlaced) return form.store;
+  }
+  return nullptr;
+}
+
+// All rows, inflated at once. False, with the target in any state, when the library has to try.
+bool ReadAtOnce(const PngReader& reader, const PngLayout& layout, const PictureRecord& picture, PngTarget& target) {
+  const StoreFileRow store = FileRowStore(reader, layout);
+  if (store == nullptr) return false;
+  const uint32_t pixelBits = uint32_t{png_get_bit_depth(reader.png, reader.info)} * png_get_channels(reader.png, reader.info);
+  const uint64_t rowBytes = (static_cast<uint64_t>(layout.width) * pixelBits + 7) / 8;
+  PngPixels pixels;
+  if (!pixels.Inflate(reader.file, rowBytes, pixelBits, layout.height)) return false;
+  for (int32_t y = 0; y < layout.height; ++y) {
+    const uint8_t* row = pixels.NextRow();
+    if (row == nullptr) return false;
+    store(row, static_cast<size_t>(layout.width), reader, target.image.Row(y).data(),
+          target.alpha.Empty() ? nullptr : target.alpha.Row(y).data());
+    picture.ReportRow(y);
+  }
+  return true;
+}
+
+Status ReadPixels(PngReader& reader, const PngLayout& layout, PictureRecord& picture) {
+  PngTarget target;
+  RETURN_IF_BAD(NewPackedImage(layout.width, layout.height, &picture.palette, layout.bitsPerPixel, target.image));
+  if (layout.rows == RowForm::WithAlpha) RETURN_IF_BAD(NewAlphaPlane(layout.width, layout.height, target.alpha));
+  if (!ReadAtOnce(reader, layout, picture, target)) {
+    // Only now: the library takes memory for rows of whatever width the file claims.
+    if (!PngGuarded(reader.png, [&] { SetConversions(reader, layout); })) return reader.Failure();
+    RETURN_IF_BAD(layout.interlaced ? ReadInterlaced(reader, layout, picture, target)
+                                    : ReadInOrder(reader, layout, picture, target));
+  }
+  picture.image = std::move(target.image);
+  picture.alpha = std::move(target.alpha);
+  return Status::Ok;
+}
+
+const char* ColorTypeName(png_byte type) {
+  switch (type) {
+    case PNG_COLOR_TYPE_GRAY: return "grey";
+    case PNG_COLOR_TYPE_PALETTE: return "palette";
+    case PNG_COLOR_TYPE_RGB: return "true color";
+    case PNG_COLOR_TYPE_GRAY_ALPHA: return "grey with alpha";
+    default: return "true color with alpha";
+  }
+}
+
+void AddHeaderLines(const PngReader& reader, DetailLines& lines) {
+  lines.AddFormat("   Color type: %s", ColorTypeName(png_get_color_type(reader.png, reader.info)));
+  lines.AddFormat("    Bit depth: %d", png_get_bit_depth(reader.png, reader.info));
+  const bool interlaced = png_get_interlace_type(reader.png, reader.info) != PNG_INTERLACE_NONE;
+  lines.AddFormat("   Interlaced: %s", interlaced ? "yes" : "no");
+  double gamma = 0;
+  if (png_get_gAMA(reader.png, reader.info, &gamma) != 0) lines.AddFormat("        Gamma: %.5f", gamma);
+  int intent = 0;
+  if (png_get_sRGB(reader.png, reader.info, &intent) != 0) lines.Add("  Color space: sRGB");
+}
+
+void AddMetadataLines(const PictureRecord& picture, DetailLines& lines) {
+  const PictureMetadata& metadata = picture.metadata;
+  if (metadata.dpiX > 0) lines.AddFormat("   Resolution: %.0f x %.0f dpi", metadata.dpiX, metadata.dpiY);
+  if (!metadata.icc.empty()) lines.AddFormat("  ICC profile: %zu bytes", metadata.icc.size());
+  if (!metadata.exif.empty()) lines.AddFormat("         EXIF: %zu bytes", metadata.exif.size());
+  if (!metadata.xmp.empty()) lines.AddFormat("          XMP: %zu bytes", metadata.xmp.size());
+  if (picture.pageCount > 1) lines.AddFormat("       Frames: %d", picture.pageCount);
+}
+
+// The text chunks' keywords and the chunks' number.
+void AddChunkLines(std::span<const uint8_t> file, DetailLines& lines) {
+  PngChunks chunks(file);
+  PngChunk chunk;
+  int count = 0, pixels = 0;
+  for (; chunks.Next(chunk); ++count) {
+    pixels += chunk.type == "IDAT";
+    if (chunk.type != "tEXt" && chunk.type != "zTXt" && chunk.type != "iTXt") continue;
+    std::string line = "         Text: ";
+    for (const uint8_t c : chunk.data.first(std::min<size_t>(chunk.data.size(), 79))) {
+      if (c == 0) break;
+      line += c < 0x20 ? '?' : static_cast<char>(c);
+    }
+    lines.Add(line);
+  }
+  lines.AddFormat("       Chunks: %d, %d of pixels", count, pixels);
+}
+
+// Whether there are texts that somebody wrote, beside those that travel with the picture; programs write the others.
+bool HoldsFurtherTexts(std::span<const uint8_t> file) {
+  constexpr std::string_view kOthers[] = {kPngXmpKeyword, "Comment", "Software", "Creation Time"};
+  PngChunks chunks(file);
+  PngChunk chunk;
+  while (chunks.Next(chunk)) {
+    if (chunk.type != "tEXt" && chunk.type != "zTXt" && chunk.type != "iTXt") continue;
+    const std::string_view text(reinterpret_cast<const char*>(chunk.data.data()), chunk.data.size());
+    const std::string_view key = text.substr(0, text.find('\0'));
+    if (!key.starts_with("date:") && std::ranges::find(kOthers, key) == std::end(kOthers)) return true;
+  }
+  return false;
+}
+
+}  // namespace
+
+Status DescribePng(std::span<const uint8_t> file, PictureRecord& picture) {
+  PngReader reader(file);
+  PngLayout layout;
+  return Describe(reader, file, layout, picture);
+}
+
+Status DecodePng(std::span<const uint8_t> file, PictureRecord& picture) {
+  PngReader reader(file);
+  PngLayout layout;
+  RETURN_IF_BAD(Describe(reader, file, layout, picture));
+  return ReadPixels(reader, layout, picture);
+}
+
+Status PngInfo(PictureRecord& picture, const char* fileName, uint32_t) {
+  picture.typeName.Clear();
+  platform::FileView file;
+  if (!file.Open(fileName)) return Status::FileOpenError;
+  picture.fileSize = file.FileSize();
+  return DescribePng(file.Bytes(), picture);
+}
+
+Status PngRead(PictureRecord& picture, const char* fileName) {
+  const ProgressScope progress(picture);
+  picture.image.Free();
+  picture.alpha.Free();
+  platform::FileView file;
+  if (!file.Open(fileName)) return Status::FileOpenError;
+  RETURN_IF_BAD(DecodePng(file.Bytes(), picture));
+  picture.simplified = picture.simplified || HoldsFurtherTexts(file.Bytes());
+  return Status::Ok;
+}
+
+Status PngDetails(PictureRecord& picture) {
+  picture.detailLines.Clear();
+  platform::FileView file;
+  if (!file.Open(picture.fileName.c_str())) return Status::FileOpenError;
+  PngReader reader(file.Bytes());
+  RETURN_IF_BAD(ReadHeader(reader));
+  TakeMetadata(reader, picture);
+  AddHeaderLines(reader, picture.detailLines);
+  AddMetadataLines(picture, picture.detailLines);
+  AddChunkLines(file.Bytes(), picture.detailLines);
+  return Status::Ok;
+}
+
+}  // namespace fotomill

@@ -1,0 +1,595 @@
+// TIFF and BigTIFF, either byte order, decoded by libtiff; tiff_write.cpp writes.
+//
+//   "II" or "MM", 42, offset of the first directory (BigTIFF: 43, 8, 0, offset of 8 bytes); a directory is a count, entries
+//   of tag, type, count and value or offset, and the offset of the next one: each is a page.
+//   254 subfile   256 width   257 height   258 bits   259 compression   262 colours   273, 279 strips   277 samples
+//   282, 283, 296 resolution   284 planes   320 palette   322-325 tiles   338 extra samples   339 sample format
+//   700 XMP   34665 EXIF   34675 ICC profile
+//
+// What the reader makes of it: greys and palettes of 1, 2, 4 and 8 bits keep their depth (2 becomes 4), deeper greys become
+// 8 bits, everything else 24 bits, with an alpha plane where an extra sample says that it is alpha; colours that were
+// multiplied by it are divided again. CMYK is turned into RGB by the usual formula. YCbCr that is not JPEG, CIE L*a*b* and
+// LogLuv come through the library's own conversion. Orientation is not applied here: it travels in the EXIF block, which is
+// gathered from the directories of a camera. XMP, ICC profile, description and resolution travel with the picture as well.
+//
+// A file that ends before its last pixel fails (status 3). A fault inside the data that the decoder passes over is told in
+// the record's `warning`.
+// Source: Adobe, "TIFF Revision 6.0", 1992; Technical Notes 1 to 3; libtiff's documentation of BigTIFF.
+#include "formats/tiff/tiff.h"
+
+#include <algorithm>
+#include <bit>
+#include <cmath>
+#include <cstring>
+#include <string>
+#include <vector>
+
+#include "containers/exif_directories.h"
+#include "core/limits.h"
+#include "formats/png/png_filter.h"
+#include "formats/tiff/tiff_file.h"
+#include "formats/tiff/tiff_lzw.h"
+#include "formats/tiff/tiff_samples.h"
+#include "platform/file_view.h"
+#include "processing/pixel_rows.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr double kCentimetresPerInch = 2.54;
+constexpr tdir_t kMostPages = 1 << 20;
+constexpr uint32_t kMostRowSamples = 1 << 25;  // a row is held as a whole
+
+// How the rows of a page become the picture's.
+enum class TiffRows {
+  Direct,   // as the picture stores them
+  Nibbles,  // 2-bit values, to become 4-bit ones
+  Grey,     // through bytes, one of them a pixel
+  Color,    // through bytes, to blue, green, red and alpha
+  Library   // the library's own conversion
+};
+
+struct TiffLayout {
+  uint32_t width = 0, height = 0;
+  TiffSampleForm form;
+  uint16_t samples = 1, colors = 1;  // of a pixel, and how many of them are colours
+  uint16_t photometric = 0, compression = 0;
+  bool separate = false;  // each sample has strips or tiles of its own
+  bool tiled = false;
+  uint32_t bandHeight = 0;  // rows of a strip or tile
+  uint32_t tileWidth = 0;
+  int alpha = -1;           // the sample that is alpha
+  bool multiplied = false;  // colours were multiplied by alpha
+  TiffRows rows = TiffRows::Library;
+  int32_t bitsPerPixel = 24;
+};
+
+template <typename T>
+T Field(TIFF* tiff, uint32_t tag) {
+  T value = 0;
+  TIFFGetFieldDefaulted(tiff, tag, &value);
+  return value;
+}
+
+void FindAlpha(TIFF* tiff, TiffLayout& layout) {
+  uint16_t count = 0, *kinds = nullptr;
+  const bool told = TIFFGetField(tiff, TIFFTAG_EXTRASAMPLES, &count, &kinds) != 0 && count > 0;
+  if (!told && layout.photometric == PHOTOMETRIC_RGB && layout.samples == 4) layout.alpha = 3;  // old files do not say
+  if (!told) return;
+  for (uint16_t i = 0; i < count && layout.alpha < 0; ++i) {
+    if (kinds[i] != EXTRASAMPLE_ASSOCALPHA && kinds[i] != EXTRASAMPLE_UNASSALPHA) continue;
+    layout.alpha = layout.colors + i;
+    layout.multiplied = kinds[i] == EXTRASAMPLE_ASSOCALPHA;
+  }
+  if (layout.alpha >= layout.samples) layout.alpha = -1;
+}
+
+uint16_t ColorsOf(TIFF* tiff, const TiffLayout& layout) {
+  switch (layout.photometric) {
+    case PHOTOMETRIC_RGB: return 3;
+    case PHOTOMETRIC_YCBCR: return layout.compression == COMPRESSION_JPEG ? 3 : 0;
+    case PHOTOMETRIC_SEPARATED: return Field<uint16_t>(tiff, TIFFTAG_INKSET) == INKSET_CMYK ? 4 : 0;
+    case PHOTOMETRIC_MINISBLACK:
+    case PHOTOMETRIC_MINISWHITE:
+    case PHOTOMETRIC_PALETTE: return 1;
+    default: return 0;  // left to the library
+  }
+}
+
+void ChooseRows(TiffLayout& layout) {
+  const bool indexed = layout.photometric == PHOTOMETRIC_PALETTE;
+  const uint32_t bits = layout.form.bits;
+  const bool small = bits <= 8 && layout.form.kind == TiffSampleForm::Unsigned;
+  if (layout.colors == 0 || layout.colors > layout.samples || !CanConvert(layout.form) || (indexed && !small)) return;
+  if (layout.colors == 1 && layout.alpha < 0 && layout.samples == 1 && small && std::has_single_bit(bits)) {
+    layout.rows = bits == 2 ? TiffRows::Nibbles : TiffRows::Direct;
+    layout.bitsPerPixel = static_cast<int32_t>(bits);
+  } else if (layout.colors == 1 && layout.alpha < 0) {
+    layout.rows = TiffRows::Grey;
+    layout.bitsPerPixel = 8;
+  } else {
+    layout.rows = TiffRows::Color;
+  }
+}
+
+Status ReadLayout(TIFF* tiff, TiffLayout& layout) {
+  layout.width = Field<uint32_t>(tiff, TIFFTAG_IMAGEWIDTH);
+  layout.height = Field<uint32_t>(tiff, TIFFTAG_IMAGELENGTH);
+  if (layout.width < 1 || layout.height < 1 || layout.width > INT32_MAX || layout.height > INT32_MAX) return Status::DamagedFile;
+  layout.form.bits = Field<uint16_t>(tiff, TIFFTAG_BITSPERSAMPLE);
+  layout.samples = Field<uint16_t>(tiff, TIFFTAG_SAMPLESPERPIXEL);
+  layout.compression = Field<uint16_t>(tiff, TIFFTAG_COMPRESSION);
+  const uint16_t format = Field<uint16_t>(tiff, TIFFTAG_SAMPLEFORMAT);
+  layout.form.kind = format == SAMPLEFORMAT_IEEEFP ? TiffSampleForm::Float
+                     : format == SAMPLEFORMAT_INT  ? TiffSampleForm::Signed
+                                                   : TiffSampleForm::Unsigned;
+  if (TIFFGetField(tiff, TIFFTAG_PHOTOMETRIC, &layout.photometric) == 0) {  // old fax files leave it out
+    layout.photometric = layout.samples >= 3 ? PHOTOMETRIC_RGB : PHOTOMETRIC_MINISWHITE;
+  }
+  if (layout.samples < 1 || layout.form.bits < 1) return Status::DamagedFile;
+  layout.separate = layout.samples > 1 && Field<uint16_t>(tiff, TIFFTAG_PLANARCONFIG) == PLANARCONFIG_SEPARATE;
+  layout.tiled = TIFFIsTiled(tiff) != 0;
+  layout.tileWidth = layout.tiled ? Field<uint32_t>(tiff, TIFFTAG_TILEWIDTH) : layout.width;
+  layout.bandHeight = Field<uint32_t>(tiff, layout.tiled ? TIFFTAG_TILELENGTH : TIFFTAG_ROWSPERSTRIP);
+  if (layout.bandHeight < 1 || layout.tileWidth < 1) return Status::DamagedFile;
+  if (!layout.tiled) layout.bandHeight = std::min(layout.bandHeight, layout.height);
+  layout.colors = ColorsOf(tiff, layout);
+  if (layout.colors > 0) FindAlpha(tiff, layout);
+  ChooseRows(layout);
+  if (layout.compression == COMPRESSION_JPEG) TIFFSetField(tiff, TIFFTAG_JPEGCOLORMODE, JPEGCOLORMODE_RGB);
+  return Status::Ok;
+}
+
+// Uncompressed pixels must be in the file before memory is taken for them.
+bool FileHoldsPixels(const TiffInput& input, const TiffLayout& layout) {
+  if (layout.compression != COMPRESSION_NONE || layout.rows == TiffRows::Library) return true;
+  const uint64_t rowBytes = (uint64_t{layout.width} * layout.form.bits * layout.samples + 7) / 8;
+  return rowBytes <= input.Bytes().size() / layout.height;
+}
+
+// Colours of 16 bits; some programs store 8.
+void TakeColors(TIFF* tiff, size_t count, Palette& palette) {
+  uint16_t* channels[3] = {};
+  if (TIFFGetField(tiff, TIFFTAG_COLORMAP, &channels[0], &channels[1], &channels[2]) == 0) return;
+  bool wide = false;
+  for (const uint16_t* channel : channels)
+    wide = wide || std::any_of(channel, channel + count, [](uint16_t v) { return v > 255; });
+  for (size_t i = 0; i < std::min<size_t>(count, 256); ++i) {
+    for (size_t c = 0; c < 3; ++c) palette[3 * i + c] = static_cast<uint8_t>(wide ? channels[c][i] >> 8 : channels[c][i]);
+  }
+}
+
+void TakePalette(TIFF* tiff, const TiffLayout& layout, Palette& palette) {
+  if (layout.photometric == PHOTOMETRIC_PALETTE && layout.rows != TiffRows::Library) {
+    palette.fill(0);
+    TakeColors(tiff, size_t{1} << layout.form.bits, palette);
+    return;
+  }
+  if (layout.bitsPerPixel == 24) {
+    MakeDefaultPalette(&palette, nullptr, kDisplayPalette);
+    return;
+  }
+  const int levels = 1 << layout.bitsPerPixel;
+  const bool inverted = layout.photometric == PHOTOMETRIC_MINISWHITE;
+  palette.fill(0);
+  for (int i = 0; i < levels; ++i) {
+    const auto level = static_cast<uint8_t>((inverted ? levels - 1 - i : i) * 255 / (levels - 1));
+    std::fill_n(palette.begin() + 3 * i, 3, level);
+  }
+}
+
+void TakeBlock(TIFF* tiff, uint32_t tag, std::vector<uint8_t>& block) {
+  uint32_t size = 0;
+  void* data = nullptr;
+  block.clear();
+  if (TIFFGetField(tiff, tag, &size, &data) == 0 || data == nullptr || size > limits.metadataBytes) return;
+  block.assign(static_cast<const uint8_t*>(data), static_cast<const uint8_t*>(data) + size);
+}
+
+void TakeMetadata(const TiffInput& input, PictureRecord& picture) {
+  TIFF* tiff = input.Handle();
+  PictureMetadata& metadata = picture.metadata;
+  metadata = {};
+  const DirectoryForm form = {TIFFIsBigEndian(tiff) != 0, TIFFIsBigTIFF(tiff) != 0};
+  metadata.exif = MakePictureBlock(GatherExif(input.Bytes(), form, TIFFCurrentDirOffset(tiff)));
+  TakeBlock(tiff, TIFFTAG_XMLPACKET, metadata.xmp);
+  TakeBlock(tiff, TIFFTAG_ICCPROFILE, metadata.icc);
+  picture.comment.clear();
+  const char* text = nullptr;
+  if (TIFFGetField(tiff, TIFFTAG_IMAGEDESCRIPTION, &text) != 0 && text != nullptr) {
+    picture.comment.assign(text, text + std::min<uint64_t>(std::strlen(text), limits.metadataBytes));
+  }
+  float x = 0, y = 0;
+  const uint16_t unit = Field<uint16_t>(tiff, TIFFTAG_RESOLUTIONUNIT);
+  TIFFGetField(tiff, TIFFTAG_XRESOLUTION, &x);
+  TIFFGetField(tiff, TIFFTAG_YRESOLUTION, &y);
+  if (unit == RESUNIT_NONE || !(x > 0) || !(y > 0) || !std::isfinite(x) || !std::isfinite(y)) return;
+  const double perInch = unit == RESUNIT_CENTIMETER ? kCentimetresPerInch : 1;
+  metadata.dpiX = x * perInch;
+  metadata.dpiY = y * perInch;
+}
+
+// Whether there are tags of weight that a new file would not have: captions, places on the earth, and without a camera's
+// directory those of the author.
+bool HoldsFurtherTags(TIFF* tiff) {
+  constexpr uint32_t kFurther[] = {TIFFTAG_RICHTIFFIPTC, TIFFTAG_PHOTOSHOP, 33550, 33922, 34264, 34735};  // the last: GeoTIFF
+  uint64_t place = 0;
+  const bool camera = TIFFGetField(tiff, TIFFTAG_EXIFIFD, &place) != 0 || TIFFGetField(tiff, TIFFTAG_GPSIFD, &place) != 0;
+  const int count = TIFFGetTagListCount(tiff);
+  for (int i = 0; i < count; ++i) {
+    const uint32_t tag = TIFFGetTagListEntry(tiff, i);
+    if (!camera && (tag == TIFFTAG_ARTIST || tag == TIFFTAG_COPYRIGHT)) return true;
+    if (std::ranges::find(kFurther, tag) != std::end(kFurther)) return true;
+  }
+  return false;
+}
+
+// Opens the page that the record asks for and fills the facts.
+Status Describe(TiffInput& input, TiffLayout& layout, PictureRecord& picture) {
+  RETURN_IF_BAD(input.Open());
+  TIFF* tiff = input.Handle();
+  const tdir_t pages = std::clamp<tdir_t>(TIFFNumberOfDirectories(tiff), 1, kMostPages);
+  if (picture.page < 0 || static_cast<tdir_t>(picture.page) >= pages) return Status::NoImages;
+  if (TIFFSetDirectory(tiff, static_cast<tdir_t>(picture.page)) == 0) return input.Failure();
+  RETURN_IF_BAD(ReadLayout(tiff, layout));
+  picture.pageCount = static_cast<int32_t>(pages);
+  picture.typeName.AssignCut(TIFFIsBigTIFF(tiff) != 0 ? "BigTIFF" : "TIFF");
+  picture.width = static_cast<int32_t>(layout.width);
+  picture.height = static_cast<int32_t>(layout.height);
+  picture.bitsPerPixel = layout.bitsPerPixel;
+  picture.simplified =
+      layout.form.bits > 8 || layout.colors > 3 || layout.photometric >= PHOTOMETRIC_CIELAB || HoldsFurtherTags(tiff);
+  picture.alphaFlags = static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (layout.alpha >= 0 ? kHasAlpha : 0));
+  picture.imageBytes = EstimateImageBytes(picture.width, picture.height, picture.bitsPerPixel);
+  TakePalette(tiff, layout, picture.palette);
+  TakeMetadata(input, picture);
+  return Status::Ok;
+}
+
+struct TiffTarget {
+  PackedImage image, alpha;
+};
+
+uint8_t Divided(uint32_t value, uint32_t alpha) {
+  return alpha == 0 ? 0 : static_cast<uint8_t>(std::min(255u, (value * 255 + alpha / 2) / alpha));
+}
+
+// Turns decoded rows into the picture's.
+class TiffConverter {
+ public:
+  TiffConverter(const TiffLayout& layout, const Palette& palette, TiffTarget& target)
+      : layout_(layout), palette_(palette), target_(target), bytes_(size_t{layout.samples} * layout.width) {}
+
+  // `row` holds all samples, or the first one's row with those of the others `planeStride` bytes apart.
+  void Store(int32_t y, const uint8_t* row, size_t planeStride) {
+    uint8_t* image = target_.image.Row(y).data();
+    const size_t width = layout_.width;
+    if (layout_.rows == TiffRows::Direct) {
+      std::memcpy(image, row, (width * layout_.form.bits + 7) / 8);
+    } else if (layout_.rows == TiffRows::Nibbles) {
+      for (size_t x = 0; x < width; ++x) {
+        const int value = row[x / 4] >> (6 - x % 4 * 2) & 3;
+        image[x / 2] = static_cast<uint8_t>(x % 2 == 0 ? value << 4 : image[x / 2] | value);
+      }
+    } else {
+      const uint8_t* samples = AsBytes(row, planeStride);
+      if (layout_.rows == TiffRows::Grey) {
+        for (size_t x = 0; x < width; ++x) image[x] = samples[x * layout_.samples];
+      } else {
+        StoreColors(samples, image);
+        if (layout_.alpha >= 0) StoreAlpha(samples, image, target_.alpha.Row(y).data());
+      }
+    }
+  }
+
+ private:
+  const uint8_t* AsBytes(const uint8_t* row, size_t planeStride) {
+    const bool scaled = layout_.photometric != PHOTOMETRIC_PALETTE;
+    const TiffSampleForm& form = layout_.form;
+    if (planeStride == 0) {
+      if (form.bits == 8 && form.kind == TiffSampleForm::Unsigned) return row;
+      ConvertSamples(row, form, scaled, bytes_.size(), bytes_.data(), 1);
+      return bytes_.data();
+    }
+    for (size_t s = 0; s < layout_.samples; ++s) {
+      ConvertSamples(row + s * planeStride, form, scaled, layout_.width, bytes_.data() + s, layout_.samples);
+    }
+    return bytes_.data();
+  }
+
+  void StoreColors(const uint8_t* samples, uint8_t* image) const {
+    const size_t width = layout_.width, step = layout_.samples;
+    if (layout_.colors == 3 && step == 3) {
+      SwapColors(samples, width, image);
+    } else if (layout_.colors == 3) {
+      for (size_t x = 0; x < width; ++x, samples += step, image += 3) {
+        image[0] = samples[2];
+        image[1] = samples[1];
+        image[2] = samples[0];
+      }
+    } else if (layout_.colors == 4) {
+      for (size_t x = 0; x < width; ++x, samples += step, image += 3) {
+        for (size_t i = 0; i < 3; ++i)
+          image[i] = static_cast<uint8_t>(((255u - samples[2 - i]) * (255u - samples[3]) + 127) / 255);
+      }
+    } else {
+      const bool indexed = layout_.photometric == PHOTOMETRIC_PALETTE;
+      const uint8_t flip = layout_.photometric == PHOTOMETRIC_MINISWHITE ? 255 : 0;
+      for (size_t x = 0; x < width; ++x, samples += step, image += 3) {
+        for (size_t i = 0; i < 3; ++i) {
+          image[i] = indexed ? palette_[3 * size_t{samples[0]} + 2 - i] : static_cast<uint8_t>(samples[0] ^ flip);
+        }
+      }
+    }
+  }
+
+  void StoreAlpha(const uint8_t* samples, uint8_t* image, uint8_t* alpha) const {
+    const bool unscaled = layout_.photometric == PHOTOMETRIC_PALETTE;
+    const uint32_t most = unscaled ? (1u << layout_.form.bits) - 1 : 255;
+    samples += layout_.alpha;
+    for (size_t x = 0; x < layout_.width; ++x, samples += layout_.samples, image += 3) {
+      alpha[x] = static_cast<uint8_t>(*samples * 255u / most);
+      if (!layout_.multiplied) continue;
+      for (size_t i = 0; i < 3; ++i) image[i] = Divided(image[i], alpha[x]);
+    }
+  }
+
+  const TiffLayout& layout_;
+  const Palette& palette_;
+  TiffTarget& target_;
+  std::vector<uint8_t> bytes_;  // one row's samples
+};
+
+// Whether rows can be taken from the strips without the library: whole bytes or less a sample, in the usual bit order.
+bool HasPlainStrips(TIFF* tiff, const TiffLayout& layout) {
+  return !layout.tiled && !layout.separate && layout.form.bits <= 8 &&
+         Field<uint16_t>(tiff, TIFFTAG_FILLORDER) == FILLORDER_MSB2LSB && (layout.photometric != PHOTOMETRIC_YCBCR);
+}
+
+// Uncompressed rows straight from the file, LZW through our own decoder, which is three times as fast as the library's. False,
+// with the target in any state, for every other page and for anything odd: then the library says what is the matter.
+bool ReadPlainStrips(TiffInput& input, const TiffLayout& layout, const PictureRecord& picture, TiffConverter& converter) {
+  TIFF* tiff = input.Handle();
+  const bool packed = layout.compression == COMPRESSION_LZW;
+  if (!HasPlainStrips(tiff, layout) || (!packed && layout.compression != COMPRESSION_NONE)) return false;
+  const uint16_t predictor = packed ? Field<uint16_t>(tiff, TIFFTAG_PREDICTOR) : uint16_t{PREDICTOR_NONE};
+  const bool differences = predictor == PREDICTOR_HORIZONTAL;
+  if (predictor != PREDICTOR_NONE && (!differences || layout.form.bits != 8)) return false;
+  const uint64_t rowBytes = (uint64_t{layout.width} * layout.form.bits * layout.samples + 7) / 8;
+  const std::vector<uint8_t> none(differences ? rowBytes : 0);
+  TiffLzwDecoder decoder;
+  for (uint32_t top = 0, strip = 0; top < layout.height; top += std::min(layout.bandHeight, layout.height - top), ++strip) {
+    const uint32_t rows = std::min(layout.bandHeight, layout.height - top);
+    const uint64_t offset = TIFFGetStrileOffset(tiff, strip), stored = TIFFGetStrileByteCount(tiff, strip);
+    if (offset > input.Bytes().size() || stored > input.Bytes().size() - offset) return false;
+    if ((packed && rowBytes * rows > limits.packedBlockBytes / 4) || (!packed && rowBytes * rows > stored)) return false;
+    const auto data = input.Bytes().subspan(offset, stored);
+    uint8_t* decoded = packed ? decoder.Decode(data, rowBytes * rows) : nullptr;
+    if (packed && decoded == nullptr) return false;
+    for (uint32_t r = 0; r < rows; ++r) {
+      const uint64_t place = r * rowBytes;
+      // Differences between neighbours are what the format's namesake in PNG has too.
+      if (differences &&
+          !UndoPngFilter(static_cast<uint8_t>(PngFilter::Sub), decoded + place, none.data(), rowBytes, layout.samples)) {
+        return false;
+      }
+      const auto y = static_cast<int32_t>(top + r);
+      converter.Store(y, packed ? decoded + place : data.data() + place, 0);
+      picture.ReportRow(y);
+    }
+  }
+  return true;
+}
+
+Status ReadScanlines(TiffInput& input, const TiffLayout& layout, const PictureRecord& picture, TiffConverter& converter) {
+  TIFF* tiff = input.Handle();
+  const uint64_t rowBytes = (uint64_t{layout.width} * layout.form.bits * layout.samples + 7) / 8;
+  const uint64_t given = TIFFScanlineSize64(tiff);
+  if (given < rowBytes || given > 2 * rowBytes + 64) return Status::DamagedFile;
+  std::vector<uint8_t> row(given);
+  for (uint32_t y = 0; y < layout.height; ++y) {
+    if (TIFFReadScanline(tiff, row.data(), y, 0) < 0) return input.Failure();
+    converter.Store(static_cast<int32_t>(y), row.data(), 0);
+    picture.ReportRow(static_cast<int32_t>(y));
+  }
+  return Status::Ok;
+}
+
+// A band of rows as wide as the picture, of one plane after the other, filled from tiles or from strips of each plane.
+class TiffBand {
+ public:
+  TiffBand(TiffInput& input, const TiffLayout& layout) : input_(input), layout_(layout) {
+    bitsPerPixel_ = uint64_t{layout.form.bits} * (layout.separate ? 1 : layout.samples);
+    planes_ = layout.separate ? layout.samples : 1u;
+    rowBytes_ = (layout.width * bitsPerPixel_ + 7) / 8;
+    rows_ = std::min(layout.bandHeight, layout.height);
+  }
+  Status Allocate() {
+    const uint64_t planeBytes = rowBytes_ * rows_;
+    if (planeBytes > limits.packedBlockBytes / planes_) return Status::MemoryAllocationError;
+    TIFF* tiff = input_.Handle();
+    pieceRow_ = layout_.tiled ? TIFFTileRowSize64(tiff) : TIFFScanlineSize64(tiff);
+    pieceBytes_ = layout_.tiled ? TIFFTileSize64(tiff) : pieceRow_ * rows_;
+    if (pieceRow_ == 0 || pieceBytes_ == 0) return Status::DamagedFile;
+    if (pieceBytes_ > limits.packedBlockBytes) return Status::MemoryAllocationError;
+    if (layout_.tiled && layout_.tileWidth < layout_.width && layout_.tileWidth * bitsPerPixel_ % 8 != 0) {
+      return Status::UnsupportedFormat;
+    }
+    const bool taken = bytes_.Allocate(planeBytes * planes_) && piece_.Allocate(pieceBytes_);
+    return taken ? Status::Ok : Status::MemoryAllocationError;
+  }
+  Status Fill(uint32_t y) {
+    for (uint32_t plane = 0; plane < planes_; ++plane) {
+      for (uint32_t x = 0; x < layout_.width; x += std::min(layout_.tileWidth, layout_.width - x)) {
+        RETURN_IF_BAD(FillPiece(x, y, plane));
+      }
+    }
+    return Status::Ok;
+  }
+  uint32_t Rows() const { return rows_; }
+  const uint8_t* Row(uint32_t r) const { return bytes_.Data() + rowBytes_ * r; }
+  size_t PlaneStride() const { return planes_ > 1 ? rowBytes_ * rows_ : 0; }
+
+ private:
+  Status FillPiece(uint32_t x, uint32_t y, uint32_t plane) {
+    TIFF* tiff = input_.Handle();
+    const auto sample = static_cast<uint16_t>(plane);
+    const auto most = static_cast<tmsize_t>(pieceBytes_);
+    const tmsize_t read = layout_.tiled ? TIFFReadEncodedTile(tiff, TIFFComputeTile(tiff, x, y, 0, sample), piece_.Data(), most)
+                                        : TIFFReadEncodedStrip(tiff, TIFFComputeStrip(tiff, y, sample), piece_.Data(), most);
+    if (read < 0) return input_.Failure();
+    const uint64_t left = x * bitsPerPixel_ / 8;
+    const uint64_t count = std::min(pieceRow_, rowBytes_ - left);
+    const uint32_t rows = std::min(rows_, layout_.height - y);
+    for (uint32_t r = 0; r < rows && (r + 1) * pieceRow_ <= pieceBytes_; ++r) {
+      std::memcpy(bytes_.Data() + plane * rowBytes_ * rows_ + r * rowBytes_ + left, piece_.Data() + r * pieceRow_, count);
+    }
+    return Status::Ok;
+  }
+
+  TiffInput& input_;
+  const TiffLayout& layout_;
+  uint64_t bitsPerPixel_ = 0, rowBytes_ = 0, pieceRow_ = 0, pieceBytes_ = 0;
+  uint32_t planes_ = 1, rows_ = 0;
+  platform::MemoryBlock bytes_, piece_;
+};
+
+Status ReadBands(TiffInput& input, const TiffLayout& layout, const PictureRecord& picture, TiffConverter& converter) {
+  TiffBand band(input, layout);
+  RETURN_IF_BAD(band.Allocate());
+  for (uint32_t top = 0; top < layout.height; top += std::min(band.Rows(), layout.height - top)) {
+    RETURN_IF_BAD(band.Fill(top));
+    for (uint32_t r = 0; r < band.Rows() && top + r < layout.height; ++r) {
+      converter.Store(static_cast<int32_t>(top + r), band.Row(r), band.PlaneStride());
+      picture.ReportRow(static_cast<int32_t>(top + r));
+    }
+  }
+  return Status::Ok;
+}
+
+// What only the library can convert comes as one raster of red, green, blue and alpha, colours multiplied by alpha.
+Status ReadThroughLibrary(TiffInput& input, const TiffLayout& layout, PictureRecord& picture, TiffTarget& target) {
+  const uint64_t pixels = uint64_t{layout.width} * layout.height;
+  if (pixels > limits.packedBlockBytes / 4) return Status::MemoryAllocationError;
+  char why[1024] = {};
+  TIFFRGBAImage image;
+  if (TIFFRGBAImageOK(input.Handle(), why) == 0) return Status::UnsupportedFormat;
+  if (TIFFRGBAImageBegin(&image, input.Handle(), 1, why) == 0) return Status::UnsupportedFormat;
+  image.orientation = image.req_orientation = ORIENTATION_TOPLEFT;
+  platform::MemoryBlock raster;
+  const bool taken = raster.Allocate(4 * pixels);
+  const bool read = taken && TIFFRGBAImageGet(&image, raster.Items<uint32_t>().data(), layout.width, layout.height) != 0;
+  TIFFRGBAImageEnd(&image);
+  if (!taken) return Status::MemoryAllocationError;
+  if (!read) return input.Failure();
+  const uint32_t* source = raster.Items<uint32_t>().data();
+  for (int32_t y = 0; y < picture.height; ++y) {
+    uint8_t* row = target.image.Row(y).data();
+    for (uint32_t x = 0; x < layout.width; ++x, ++source, row += 3) {
+      row[0] = static_cast<uint8_t>(TIFFGetB(*source));
+      row[1] = static_cast<uint8_t>(TIFFGetG(*source));
+      row[2] = static_cast<uint8_t>(TIFFGetR(*source));
+    }
+    picture.ReportRow(y);
+  }
+  return Status::Ok;
+}
+
+Status ReadPixels(TiffInput& input, const TiffLayout& layout, PictureRecord& picture) {
+  if (!FileHoldsPixels(input, layout)) return Status::FileReadError;
+  if (layout.width > kMostRowSamples / layout.samples) return Status::MemoryAllocationError;
+  TiffTarget target;
+  RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette, layout.bitsPerPixel, target.image));
+  if (layout.alpha >= 0) RETURN_IF_BAD(NewAlphaPlane(picture.width, picture.height, target.alpha));
+  input.Messages().inPixels = true;
+  if (layout.rows == TiffRows::Library) {
+    RETURN_IF_BAD(ReadThroughLibrary(input, layout, picture, target));
+  } else {
+    TiffConverter converter(layout, picture.palette, target);
+    const bool done = ReadPlainStrips(input, layout, picture, converter);
+    if (!done)
+      RETURN_IF_BAD(layout.tiled || layout.separate ? ReadBands(input, layout, picture, converter)
+                                                    : ReadScanlines(input, layout, picture, converter));
+  }
+  picture.image = std::move(target.image);
+  picture.alpha = std::move(target.alpha);
+  return Status::Ok;
+}
+
+const char* CompressionName(uint16_t compression) {
+  const TIFFCodec* codec = TIFFFindCODEC(compression);
+  return codec != nullptr ? codec->name : "unknown";
+}
+
+const char* PhotometricName(uint16_t photometric) {
+  constexpr const char* kNames[] = {"grey, 0 is white", "grey", "RGB", "palette", "mask", "CMYK", "YCbCr", "", "CIE L*a*b*"};
+  return photometric < std::size(kNames) ? kNames[photometric] : "other";
+}
+
+void AddDetails(TIFF* tiff, const TiffLayout& layout, const PictureRecord& picture, DetailLines& lines) {
+  const uint32_t pieces = layout.tiled ? TIFFNumberOfTiles(tiff) : TIFFNumberOfStrips(tiff);
+  lines.AddFormat("  Compression: %s", CompressionName(layout.compression));
+  lines.AddFormat("  Color space: %s", PhotometricName(layout.photometric));
+  lines.AddFormat("      Samples: %u of %u bits%s", unsigned{layout.samples}, layout.form.bits,
+                  layout.form.kind == TiffSampleForm::Float ? ", real" : "");
+  if (layout.samples > 1) lines.AddFormat("       Planes: %s", layout.separate ? "separate" : "together");
+  lines.AddFormat("       %s: %u of %u x %u", layout.tiled ? " Tiles" : "Strips", pieces, layout.tileWidth, layout.bandHeight);
+  lines.AddFormat("   Byte order: %s", TIFFIsBigEndian(tiff) != 0 ? "big-endian" : "little-endian");
+  const PictureMetadata& metadata = picture.metadata;
+  if (metadata.dpiX > 0) lines.AddFormat("   Resolution: %.0f x %.0f dpi", metadata.dpiX, metadata.dpiY);
+  if (layout.alpha >= 0) lines.AddFormat("        Alpha: %s", layout.multiplied ? "multiplied in" : "separate");
+  const uint16_t orientation = Field<uint16_t>(tiff, TIFFTAG_ORIENTATION);
+  if (orientation > 1) lines.AddFormat("  Orientation: %u", unsigned{orientation});
+  if (!metadata.icc.empty()) lines.AddFormat("  ICC profile: %zu bytes", metadata.icc.size());
+  if (!metadata.xmp.empty()) lines.AddFormat("          XMP: %zu bytes", metadata.xmp.size());
+  if (!metadata.exif.empty()) lines.AddFormat("         EXIF: %zu bytes", metadata.exif.size());
+  if (picture.pageCount > 1) lines.AddFormat("        Pages: %d", picture.pageCount);
+}
+
+}  // namespace
+
+Status TiffInfo(PictureRecord& picture, const char* fileName, uint32_t) {
+  picture.typeName.Clear();
+  platform::FileView file;
+  if (!file.Open(fileName)) return Status::FileOpenError;
+  picture.fileSize = file.FileSize();
+  TiffInput input(file.Bytes());
+  TiffLayout layout;
+  return Describe(input, layout, picture);
+}
+
+Status TiffRead(PictureRecord& picture, const char* fileName) {
+  const ProgressScope progress(picture);
+  picture.image.Free();
+  picture.alpha.Free();
+  picture.warning.Clear();
+  platform::FileView file;
+  if (!file.Open(fileName)) return Status::FileOpenError;
+  TiffInput input(file.Bytes());
+  TiffLayout layout;
+  RETURN_IF_BAD(Describe(input, layout, picture));
+  input.Messages() = {};
+  const Status status = ReadPixels(input, layout, picture);
+  if (status == Status::Ok && file.Intact()) {
+    const TiffMessages& messages = input.Messages();
+    picture.warning.AssignCut(messages.error[0] != 0 ? messages.error : messages.warning);
+    return Status::Ok;
+  }
+  picture.image.Free();
+  picture.alpha.Free();
+  return status == Status::Ok ? Status::FileReadError : status;
+}
+
+Status TiffDetails(PictureRecord& picture) {
+  picture.detailLines.Clear();
+  platform::FileView file;
+  if (!file.Open(picture.fileName.c_str())) return Status::FileOpenError;
+  TiffInput input(file.Bytes());
+  TiffLayout layout;
+  RETURN_IF_BAD(Describe(input, layout, picture));
+  AddDetails(input.Handle(), layout, picture, picture.detailLines);
+  return Status::Ok;
+}
+
+}  // namespace fotomill

@@ -1,0 +1,143 @@
+#include "formats/tiff/tiff_file.h"
+
+#include <algorithm>
+#include <cstdio>
+#include <cstring>
+#include <memory>
+#include <string_view>
+
+#include "core/limits.h"
+
+namespace fotomill {
+
+namespace {
+
+TiffMessages& MessagesOf(void* user) { return *static_cast<TiffMessages*>(user); }
+
+// Both return 1: the message has been dealt with, nobody else is to print it.
+int OnError(TIFF*, void* user, const char*, const char* format, va_list arguments) {
+  TiffMessages& messages = MessagesOf(user);
+  if (messages.error[0] == 0) std::vsnprintf(messages.error, sizeof messages.error, format, arguments);
+  return 1;
+}
+
+// What the library finds odd in directories harms nobody; and old LZW codes are no fault.
+int OnWarning(TIFF*, void* user, const char* module, const char* format, va_list arguments) {
+  TiffMessages& messages = MessagesOf(user);
+  const bool counts = messages.inPixels && messages.warning[0] == 0 && !std::string_view(module).starts_with("LZW");
+  if (counts) std::vsnprintf(messages.warning, sizeof messages.warning, format, arguments);
+  return 1;
+}
+
+uint64_t NewPosition(uint64_t position, uint64_t size, uint64_t offset, int from) {
+  return from == SEEK_SET ? offset : from == SEEK_CUR ? position + offset : size + offset;
+}
+
+struct OptionsDeleter {
+  void operator()(TIFFOpenOptions* options) const { TIFFOpenOptionsFree(options); }
+};
+using Options = std::unique_ptr<TIFFOpenOptions, OptionsDeleter>;
+
+Options NewOptions(TiffMessages& messages) {
+  // Some messages are sent without the file they belong to.
+  static const bool silenced = [] {
+    TIFFSetErrorHandler(nullptr);
+    TIFFSetWarningHandler(nullptr);
+    return true;
+  }();
+  Options options(silenced ? TIFFOpenOptionsAlloc() : nullptr);
+  if (options == nullptr) return options;
+  TIFFOpenOptionsSetMaxSingleMemAlloc(options.get(), static_cast<tmsize_t>(limits.packedBlockBytes));
+  TIFFOpenOptionsSetErrorHandlerExtR(options.get(), OnError, &messages);
+  TIFFOpenOptionsSetWarningHandlerExtR(options.get(), OnWarning, &messages);
+  return options;
+}
+
+TiffInput& InputOf(thandle_t handle) { return *static_cast<TiffInput*>(handle); }
+TiffOutput& OutputOf(thandle_t handle) { return *static_cast<TiffOutput*>(handle); }
+
+tmsize_t ReadInput(thandle_t handle, void* target, tmsize_t count) { return InputOf(handle).Read(target, count); }
+tmsize_t WriteNothing(thandle_t, void*, tmsize_t) { return -1; }
+uint64_t SeekInput(thandle_t handle, uint64_t offset, int from) { return InputOf(handle).Seek(offset, from); }
+uint64_t InputSize(thandle_t handle) { return InputOf(handle).Bytes().size(); }
+int MapInput(thandle_t handle, void** base, toff_t* size) {
+  *base = const_cast<uint8_t*>(InputOf(handle).Bytes().data());  // the library only reads it
+  *size = InputOf(handle).Bytes().size();
+  return 1;
+}
+tmsize_t ReadNothing(thandle_t, void*, tmsize_t) { return -1; }
+tmsize_t WriteOutput(thandle_t handle, void* source, tmsize_t count) { return OutputOf(handle).Write(source, count); }
+uint64_t SeekOutput(thandle_t handle, uint64_t offset, int from) { return OutputOf(handle).Seek(offset, from); }
+uint64_t OutputSize(thandle_t handle) { return OutputOf(handle).Seek(0, SEEK_END); }
+int CloseNothing(thandle_t) { return 0; }
+int MapNothing(thandle_t, void**, toff_t*) { return 0; }
+void UnmapNothing(thandle_t, void*, toff_t) {}
+
+}  // namespace
+
+TiffInput::~TiffInput() {
+  if (tiff_ != nullptr) TIFFClose(tiff_);
+}
+
+Status TiffInput::Open() {
+  if (bytes_.size() < 8) return Status::FileReadError;
+  const Options options = NewOptions(messages_);
+  if (options == nullptr) return Status::MemoryAllocationError;
+  tiff_ = TIFFClientOpenExt("", "r", this, ReadInput, WriteNothing, SeekInput, CloseNothing, InputSize, MapInput, UnmapNothing,
+                            options.get());
+  return tiff_ != nullptr ? Status::Ok : Failure();
+}
+
+Status TiffInput::Failure() const {
+  const std::string_view message(messages_.error);
+  const auto says = [&](std::string_view words) { return message.find(words) != std::string_view::npos; };
+  if (says("ot configured") || says("not supported") || says("nsupported") || says("not implemented") || says("can not handle") ||
+      says("Sorry")) {
+    return Status::UnsupportedFormat;
+  }
+  if (says("emory") || says("No space")) return Status::MemoryAllocationError;
+  if (says("ead error") || says("an not read TIFF") || says("eek error") || says("ot enough data")) return Status::FileReadError;
+  return Status::DamagedFile;
+}
+
+tmsize_t TiffInput::Read(void* target, tmsize_t count) {
+  if (count <= 0 || position_ >= bytes_.size()) return 0;
+  const size_t taken = std::min(static_cast<size_t>(count), static_cast<size_t>(bytes_.size() - position_));
+  std::memcpy(target, bytes_.data() + position_, taken);
+  position_ += taken;
+  return static_cast<tmsize_t>(taken);
+}
+
+uint64_t TiffInput::Seek(uint64_t offset, int from) {
+  position_ = NewPosition(position_, bytes_.size(), offset, from);
+  return position_;
+}
+
+TiffOutput::~TiffOutput() {
+  if (tiff_ != nullptr) TIFFClose(tiff_);
+}
+
+bool TiffOutput::Open() {
+  const Options options = NewOptions(messages_);
+  if (options == nullptr) return false;
+  tiff_ = TIFFClientOpenExt("", "wl", this, ReadNothing, WriteOutput, SeekOutput, CloseNothing, OutputSize, MapNothing,
+                            UnmapNothing, options.get());
+  return tiff_ != nullptr;
+}
+
+tmsize_t TiffOutput::Write(const void* source, tmsize_t count) {
+  std::span<const uint8_t> bytes(static_cast<const uint8_t*>(source), static_cast<size_t>(count));
+  if (position_ > out_.Position()) out_.Zeros(position_ - out_.Position());
+  const auto inside = std::min<uint64_t>(bytes.size(), out_.Position() - position_);
+  out_.Patch(position_, bytes.first(inside));
+  out_.Bytes(bytes.subspan(inside));
+  position_ += bytes.size();
+  return out_.Failed() ? -1 : count;
+}
+
+uint64_t TiffOutput::Seek(uint64_t offset, int from) {
+  position_ = NewPosition(position_, out_.Position(), offset, from);
+  return position_;
+}
+
+}  // namespace fotomill

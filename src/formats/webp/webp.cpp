@@ -1,0 +1,417 @@
+// WebP, little-endian, pixels decoded and encoded by libwebp.
+//
+//   "RIFF", length, "WEBP", then chunks of name, length and data, padded to an even length:
+//   "VP8 " lossy pixels, or "VP8L" lossless ones; or first of all
+//   "VP8X" flags (1 byte: 2 animation, 4 XMP, 8 EXIF, 16 alpha, 32 ICC), 3 bytes 0, width - 1, height - 1 (3 bytes each)
+//   "ICCP", "ANIM" background and loops, "ANMF" a frame, "ALPH" and "VP8 ", "EXIF", "XMP "
+//   ANMF: x / 2, y / 2, width - 1, height - 1, duration (3 bytes each), flags, then the frame's ALPH, VP8 or VP8L chunk
+//
+// Everything becomes 24 bits, with an alpha plane where the file has alpha. Frames of an animation are its pages, each as it
+// stands on the canvas after those before it. EXIF, XMP and ICC profile travel with the picture.
+//
+// The writer makes lossy files of quality WebPQualityFactor, or lossless ones with WebPLossless, which keep every value,
+// also beneath transparent pixels. With WebPAllowMixed it makes both and keeps the smaller.
+// Source: RFC 9649 (2024).
+#include "formats/webp/webp.h"
+
+#include <webp/decode.h>
+#include <webp/encode.h>
+
+#include <algorithm>
+#include <cstring>
+#include <memory>
+#include <string_view>
+#include <vector>
+
+#include "core/byte_reader.h"
+#include "core/byte_writer.h"
+#include "core/limits.h"
+#include "platform/file_view.h"
+#include "settings/settings.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr uint8_t kXmpFlag = 4, kExifFlag = 8, kAlphaFlag = 16, kIccFlag = 32;
+constexpr uint64_t kFileHead = 12;
+constexpr uint8_t kClearAfterwards = 1, kReplace = 2;  // flags of a frame: what becomes of it, and how it is put there
+constexpr size_t kMostFrames = 1 << 16;
+constexpr int kLossy = 1, kLossless = 2;              // WebPBitstreamFeatures::format
+constexpr std::string_view kExifHead("Exif\0\0", 6);  // some programs put it in front, as in JPEG
+
+struct WebpFrame {
+  int32_t left = 0, top = 0;  // on the canvas
+  int32_t width = 0, height = 0;
+  int32_t duration = 0;  // milliseconds
+  uint8_t flags = 0;
+  std::span<const uint8_t> pixels;  // what the library decodes: the whole file, or the frame's chunks
+};
+
+struct WebpFile {
+  int32_t width = 0, height = 0;  // of the canvas
+  bool alpha = false;
+  int format = 0;                 // of the library, 0 for an animation
+  uint16_t loops = 0;             // of an animation: how often it is played, 0 for ever
+  std::vector<WebpFrame> frames;  // one of a still picture
+  std::span<const uint8_t> icc, exif, xmp;
+};
+
+uint32_t Le24(ByteReader& bytes) {
+  const uint32_t low = bytes.Le16();
+  return low | static_cast<uint32_t>(bytes.U8()) << 16;
+}
+
+// What the library says of a stream of its own: chunks without the RIFF head, or a whole file.
+Status StatusOf(VP8StatusCode code) {
+  switch (code) {
+    case VP8_STATUS_OK: return Status::Ok;
+    case VP8_STATUS_OUT_OF_MEMORY: return Status::MemoryAllocationError;
+    case VP8_STATUS_NOT_ENOUGH_DATA:
+    case VP8_STATUS_SUSPENDED: return Status::FileReadError;
+    case VP8_STATUS_UNSUPPORTED_FEATURE: return Status::UnsupportedFormat;
+    default: return Status::DamagedFile;
+  }
+}
+
+void TakeFrame(std::span<const uint8_t> chunk, WebpFile& file) {
+  ByteReader bytes(chunk);
+  WebpFrame frame;
+  frame.left = static_cast<int32_t>(2 * Le24(bytes));
+  frame.top = static_cast<int32_t>(2 * Le24(bytes));
+  bytes.Skip(6);
+  frame.duration = static_cast<int32_t>(Le24(bytes));
+  frame.flags = bytes.U8();
+  frame.pixels = bytes.Take(bytes.Left());
+  if (file.frames.size() < kMostFrames) file.frames.push_back(frame);
+}
+
+// The chunks beside the pixels. A chunk that is cut short is taken as far as it goes: the library tells what is missing.
+void WalkChunks(std::span<const uint8_t> data, WebpFile& file) {
+  ByteReader bytes(data);
+  bytes.Skip(kFileHead);
+  while (bytes.Left() >= 8) {
+    const auto name = bytes.Take(4);
+    const uint64_t length = bytes.Le32();
+    const auto chunk = bytes.Take(std::min<uint64_t>(length, bytes.Left()));
+    const auto is = [&](const char* wanted) { return std::memcmp(name.data(), wanted, 4) == 0; };
+    if (is("ANIM") && chunk.size() >= 6) file.loops = static_cast<uint16_t>(chunk[4] | chunk[5] << 8);
+    if (is("ANMF")) TakeFrame(chunk, file);
+    if (is("ICCP")) file.icc = chunk;
+    if (is("EXIF")) file.exif = chunk;
+    if (is("XMP ")) file.xmp = chunk;
+    bytes.Skip(std::min<uint64_t>(length % 2, bytes.Left()));
+  }
+}
+
+// Asks the library for the size of an animation's frame, which must lie on the canvas.
+Status MeasureFrame(WebpFile& file, WebpFrame& frame) {
+  WebPBitstreamFeatures features;
+  RETURN_IF_BAD(StatusOf(WebPGetFeatures(frame.pixels.data(), frame.pixels.size(), &features)));
+  const bool inside = int64_t{frame.left} + features.width <= file.width && int64_t{frame.top} + features.height <= file.height;
+  if (!inside || features.has_animation != 0) return Status::DamagedFile;
+  frame.width = features.width;  // only now: a frame that has a size is drawn
+  frame.height = features.height;
+  file.alpha = file.alpha || features.has_alpha != 0;
+  return Status::Ok;
+}
+
+Status ParseFile(std::span<const uint8_t> data, WebpFile& file) {
+  if (data.size() < kFileHead) return Status::FileReadError;
+  if (std::memcmp(data.data(), "RIFF", 4) != 0 || std::memcmp(data.data() + 8, "WEBP", 4) != 0) return Status::DamagedFile;
+  WebPBitstreamFeatures features;
+  RETURN_IF_BAD(StatusOf(WebPGetFeatures(data.data(), data.size(), &features)));
+  file.width = features.width;
+  file.height = features.height;
+  file.alpha = features.has_alpha != 0;
+  file.format = features.format;
+  WalkChunks(data, file);
+  if (features.has_animation == 0) {
+    file.frames.assign(1, {.width = file.width, .height = file.height, .flags = kReplace, .pixels = data});
+    return Status::Ok;
+  }
+  if (file.frames.empty()) return Status::FileReadError;
+  // What the frames leave open of the canvas is transparent; the first one tells.
+  RETURN_IF_BAD(MeasureFrame(file, file.frames[0]));
+  file.alpha = file.alpha || file.frames[0].width < file.width || file.frames[0].height < file.height;
+  return Status::Ok;
+}
+
+void Assign(std::vector<uint8_t>& block, std::span<const uint8_t> data) {
+  block.clear();
+  if (data.size() <= limits.metadataBytes) block.assign(data.begin(), data.end());
+}
+
+void Describe(const WebpFile& file, PictureRecord& picture) {
+  picture.typeName.AssignCut(file.frames.size() > 1     ? "Animated WebP"
+                             : file.format == kLossless ? "WebP, lossless"
+                             : file.format == kLossy    ? "WebP, lossy"
+                                                        : "WebP");
+  picture.pageCount = static_cast<int32_t>(file.frames.size());
+  picture.width = file.width;
+  picture.height = file.height;
+  picture.bitsPerPixel = 24;
+  picture.alphaFlags = static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (file.alpha ? kHasAlpha : 0));
+  picture.imageBytes = EstimateImageBytes(file.width, file.height, 24);
+  MakeDefaultPalette(&picture.palette, nullptr, kDisplayPalette);
+  picture.metadata = {};
+  const bool headed =
+      file.exif.size() >= kExifHead.size() && std::memcmp(file.exif.data(), kExifHead.data(), kExifHead.size()) == 0;
+  Assign(picture.metadata.exif, headed ? file.exif.subspan(kExifHead.size()) : file.exif);
+  Assign(picture.metadata.xmp, file.xmp);
+  Assign(picture.metadata.icc, file.icc);
+}
+
+// Puts a row of a frame onto the canvas: in the place of what is there, or over it.
+void PutRow(const uint8_t* source, int32_t width, bool replace, uint8_t* color, uint8_t* alpha) {
+  for (int32_t x = 0; x < width; ++x, source += 4, color += 3, ++alpha) {
+    const uint32_t over = source[3], under = *alpha * (255 - over) / 255;
+    if (replace || over == 255 || over + under == 0) {
+      std::memcpy(color, source, 3);
+      *alpha = source[3];
+    } else if (over > 0) {
+      for (size_t i = 0; i < 3; ++i) {
+        color[i] = static_cast<uint8_t>((source[i] * over + color[i] * under + (over + under) / 2) / (over + under));
+      }
+      *alpha = static_cast<uint8_t>(over + under);
+    }
+  }
+}
+
+void ClearFrame(const WebpFrame& frame, Canvas& target) {
+  for (int32_t y = frame.top; y < frame.top + frame.height; ++y) {
+    std::fill_n(target.image.Row(y).data() + 3 * static_cast<size_t>(frame.left), 3 * static_cast<size_t>(frame.width),
+                uint8_t{0});
+    std::fill_n(target.alpha.Row(y).data() + frame.left, frame.width, uint8_t{0});
+  }
+}
+
+// With alpha, a frame is decoded to four bytes a pixel and put in its place.
+Status ReadFrame(const WebpFrame& frame, Canvas& target) {
+  const size_t stride = 4 * static_cast<size_t>(frame.width);
+  platform::MemoryBlock decoded;
+  if (!decoded.Allocate(stride * static_cast<size_t>(frame.height), platform::Fill::Unset)) return Status::MemoryAllocationError;
+  WebPDecoderConfig config;
+  if (WebPInitDecoderConfig(&config) == 0) return Status::MemoryAllocationError;
+  config.output.colorspace = MODE_BGRA;
+  config.output.is_external_memory = 1;
+  config.output.u.RGBA = {decoded.Data(), static_cast<int>(stride), decoded.Size()};
+  RETURN_IF_BAD(StatusOf(WebPDecode(frame.pixels.data(), frame.pixels.size(), &config)));
+  for (int32_t y = 0; y < frame.height; ++y) {
+    PutRow(decoded.Data() + stride * static_cast<size_t>(y), frame.width, (frame.flags & kReplace) != 0,
+           target.image.Row(frame.top + y).data() + 3 * static_cast<size_t>(frame.left),
+           target.alpha.Row(frame.top + y).data() + frame.left);
+  }
+  return Status::Ok;
+}
+
+// Puts a frame on the canvas that the frames before it have left.
+Status DrawFrame(WebpFile& file, size_t index, Canvas& target) {
+  WebpFrame& frame = file.frames[index];
+  if (frame.width == 0) RETURN_IF_BAD(MeasureFrame(file, frame));
+  if (index > 0 && (file.frames[index - 1].flags & kClearAfterwards) != 0) ClearFrame(file.frames[index - 1], target);
+  return ReadFrame(frame, target);
+}
+
+// The canvas as it is with frame `page` on it.
+Status ReadWithAlpha(WebpFile& file, const PictureRecord& picture, Canvas& target) {
+  const int32_t frames = picture.page + 1;
+  for (int32_t i = 0; i < frames; ++i) {
+    RETURN_IF_BAD(DrawFrame(file, static_cast<size_t>(i), target));
+    picture.ReportRow(i, frames);
+  }
+  return Status::Ok;
+}
+
+// An animation that does not tell of alpha may have it all the same; mostly it has not.
+void DropOpaqueAlpha(Canvas& target) {
+  for (int32_t y = 0; y < target.alpha.Height(); ++y) {
+    const uint8_t* row = target.alpha.Row(y).data();
+    if (std::any_of(row, row + target.alpha.Width(), [](uint8_t alpha) { return alpha != 255; })) return;
+  }
+  target.alpha.Free();
+}
+
+// Without alpha the library fills the picture's own rows, which are stored bottom row first.
+Status ReadOpaque(const WebpFile& file, const PictureRecord& picture, Canvas& target) {
+  WebPDecoderConfig config;
+  if (WebPInitDecoderConfig(&config) == 0) return Status::MemoryAllocationError;
+  config.output.colorspace = MODE_BGR;
+  config.output.is_external_memory = 1;
+  config.options.flip = 1;
+  config.output.u.RGBA = {target.image.Rows().data(), static_cast<int>(target.image.Stride()), target.image.Rows().size()};
+  RETURN_IF_BAD(StatusOf(WebPDecode(file.frames[0].pixels.data(), file.frames[0].pixels.size(), &config)));
+  for (int32_t y = 0; y < file.height; ++y) picture.ReportRow(y);
+  return Status::Ok;
+}
+
+class WebpAnimation final : public Animation {
+ public:
+  Status Open(const char* fileName) {
+    if (!view_.Open(fileName)) return Status::FileOpenError;
+    RETURN_IF_BAD(ParseFile(view_.Bytes(), file_));
+    for (const WebpFrame& frame : file_.frames) delays_.push_back(frame.duration);
+    rounds_ = file_.loops;
+    return CheckPackedSize(file_.width, file_.height, 24);
+  }
+
+ private:
+  Status Compose(size_t frame) override {
+    if (frame == 0) RETURN_IF_BAD(NewCanvas(file_.width, file_.height, canvas_));
+    RETURN_IF_BAD(DrawFrame(file_, frame, canvas_));
+    return view_.Intact() ? Status::Ok : Status::FileReadError;
+  }
+
+  platform::FileView view_;
+  WebpFile file_;  // views into the file
+};
+
+struct PictureDeleter {
+  void operator()(WebPPicture* picture) const { WebPPictureFree(picture); }
+};
+
+// The colour of each pixel as blue, green, red, alpha.
+void FillRow(const PictureRecord& picture, int32_t y, uint32_t* target) {
+  const PackedImage& image = picture.image;
+  const uint8_t* row = image.Row(y).data();
+  const bool color = image.Bits() == 24;
+  const auto table = image.ColorTable();
+  for (int32_t x = 0; x < image.Width(); ++x, ++target) {
+    const uint8_t* pixel = color ? row + 3 * static_cast<size_t>(x) : &table[4 * static_cast<size_t>(image.PixelAt(x, y))];
+    const uint32_t alpha = picture.alpha.Empty() ? 255 : picture.alpha.Row(y)[static_cast<size_t>(x)];
+    *target = alpha << 24 | static_cast<uint32_t>(pixel[2] << 16 | pixel[1] << 8 | pixel[0]);
+  }
+}
+
+Status Encode(const PictureRecord& picture, bool lossless, WebPMemoryWriter& encoded) {
+  WebPConfig config;
+  WebPPicture source;
+  const auto quality = static_cast<float>(std::clamp<int32_t>(settings.WebPQualityFactor, 0, 100));
+  if (WebPConfigPreset(&config, WEBP_PRESET_DEFAULT, quality) == 0 || WebPPictureInit(&source) == 0) return Status::ResourceError;
+  config.lossless = lossless ? 1 : 0;
+  config.exact = lossless ? 1 : 0;
+  source.use_argb = 1;
+  source.width = picture.image.Width();
+  source.height = picture.image.Height();
+  source.writer = WebPMemoryWrite;
+  source.custom_ptr = &encoded;
+  if (WebPPictureAlloc(&source) == 0) return Status::MemoryAllocationError;
+  const std::unique_ptr<WebPPicture, PictureDeleter> owner(&source);
+  for (int32_t y = 0; y < source.height; ++y) {
+    FillRow(picture, y, source.argb + static_cast<ptrdiff_t>(source.argb_stride) * y);
+    picture.ReportRow(y);
+  }
+  if (WebPEncode(&config, &source) != 0) return Status::Ok;
+  const bool memory =
+      source.error_code == VP8_ENC_ERROR_OUT_OF_MEMORY || source.error_code == VP8_ENC_ERROR_BITSTREAM_OUT_OF_MEMORY;
+  return memory ? Status::MemoryAllocationError : Status::ErrorWritingFile;
+}
+
+void WriteChunk(ByteWriter& out, std::string_view name, std::span<const uint8_t> data) {
+  if (data.empty()) return;
+  out.Text(name);
+  out.Le32(static_cast<uint32_t>(data.size()));
+  out.Bytes(data);
+  out.Zeros(data.size() % 2);
+}
+
+uint64_t ChunkBytes(uint64_t data) { return data == 0 ? 0 : 8 + data + data % 2; }
+
+// The encoder's file, with the chunks of metadata around its pixels where there are any.
+void WriteFile(ByteWriter& out, const PictureRecord& picture, std::span<const uint8_t> encoded) {
+  const PictureMetadata& metadata = picture.metadata;
+  const auto pixels = encoded.subspan(kFileHead);
+  const bool extended = pixels.size() >= 18 && std::memcmp(pixels.data(), "VP8X", 4) == 0;  // lossy with alpha
+  const auto chunks = extended ? pixels.subspan(18) : pixels;
+  const uint64_t length = 4 + 18 + chunks.size() + ChunkBytes(metadata.icc.size()) + ChunkBytes(metadata.exif.size()) +
+                          ChunkBytes(metadata.xmp.size());
+  const auto side = [](int32_t value) { return static_cast<uint32_t>(value - 1); };
+  out.Text("RIFF");
+  out.Le32(static_cast<uint32_t>(length));
+  out.Text("WEBPVP8X");
+  out.Le32(10);
+  out.Le32((metadata.icc.empty() ? 0u : kIccFlag) | (metadata.exif.empty() ? 0u : kExifFlag) |
+           (metadata.xmp.empty() ? 0u : kXmpFlag) | (picture.alpha.Empty() ? 0u : kAlphaFlag));
+  for (const uint32_t value : {side(picture.image.Width()), side(picture.image.Height())}) {
+    out.Le16(static_cast<uint16_t>(value));
+    out.U8(static_cast<uint8_t>(value >> 16));
+  }
+  WriteChunk(out, "ICCP", metadata.icc);
+  out.Bytes(chunks);
+  WriteChunk(out, "EXIF", metadata.exif);
+  WriteChunk(out, "XMP ", metadata.xmp);
+}
+
+struct EncodedFile {
+  EncodedFile() { WebPMemoryWriterInit(&writer); }
+  ~EncodedFile() { WebPMemoryWriterClear(&writer); }
+  EncodedFile(const EncodedFile&) = delete;
+  EncodedFile& operator=(const EncodedFile&) = delete;
+  WebPMemoryWriter writer;
+};
+
+}  // namespace
+
+Status WebpInfo(PictureRecord& picture, const char* fileName, uint32_t) {
+  picture.typeName.Clear();
+  platform::FileView view;
+  if (!view.Open(fileName)) return Status::FileOpenError;
+  picture.fileSize = view.FileSize();
+  WebpFile file;
+  RETURN_IF_BAD(ParseFile(view.Bytes(), file));
+  Describe(file, picture);
+  return Status::Ok;
+}
+
+Status WebpRead(PictureRecord& picture, const char* fileName) {
+  const ProgressScope progress(picture);
+  picture.image.Free();
+  picture.alpha.Free();
+  platform::FileView view;
+  if (!view.Open(fileName)) return Status::FileOpenError;
+  WebpFile file;
+  RETURN_IF_BAD(ParseFile(view.Bytes(), file));
+  Describe(file, picture);
+  if (picture.page < 0 || picture.page >= picture.pageCount) return Status::NoImages;
+  const bool canvas = file.alpha || file.frames.size() > 1;
+  Canvas target;
+  RETURN_IF_BAD(NewPackedImage(file.width, file.height, &picture.palette, 24, target.image));
+  if (canvas) RETURN_IF_BAD(NewAlphaPlane(file.width, file.height, target.alpha));
+  RETURN_IF_BAD(canvas ? ReadWithAlpha(file, picture, target) : ReadOpaque(file, picture, target));
+  if (!view.Intact()) return Status::FileReadError;
+  if (canvas && !file.alpha) DropOpaqueAlpha(target);
+  picture.image = std::move(target.image);
+  picture.alpha = std::move(target.alpha);
+  return Status::Ok;
+}
+
+Status WebpAnimate(const char* fileName, AnimationPointer& animation) {
+  auto opened = std::make_unique<WebpAnimation>();
+  RETURN_IF_BAD(opened->Open(fileName));
+  animation = std::move(opened);
+  return Status::Ok;
+}
+
+Status WebpWrite(PictureRecord& picture, const WriteOptions& options) {
+  const ProgressScope progress(picture);
+  if (picture.image.Empty()) return Status::MemoryAllocationError;
+  if (picture.image.Width() > WEBP_MAX_DIMENSION || picture.image.Height() > WEBP_MAX_DIMENSION) return Status::UnsuitableImage;
+  ByteWriter out;
+  if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
+  const bool lossless = options.lossless || settings.WebPLossless != 0;
+  EncodedFile encoded, other;
+  RETURN_IF_BAD(Encode(picture, lossless, encoded.writer));
+  if (!options.lossless && settings.WebPAllowMixed != 0) RETURN_IF_BAD(Encode(picture, !lossless, other.writer));
+  const bool useOther = other.writer.size > 0 && other.writer.size < encoded.writer.size;
+  const WebPMemoryWriter& chosen = useOther ? other.writer : encoded.writer;
+  const std::span<const uint8_t> bytes(chosen.mem, chosen.size);
+  const bool keep = options.keepMetadata && settings.PreserveEXIF != 0 && !picture.metadata.Empty();
+  if (keep && bytes.size() > kFileHead) {
+    WriteFile(out, picture, bytes);
+  } else {
+    out.Bytes(bytes);
+  }
+  return CommitOutput(out, options);
+}
+
+}  // namespace fotomill

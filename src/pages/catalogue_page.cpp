@@ -1,0 +1,241 @@
+#include "pages/catalogue_page.h"
+
+#include <algorithm>
+#include <atomic>
+#include <memory>
+#include <new>
+#include <utility>
+#include <vector>
+
+#include "batch/abort.h"
+#include "batch/destination_name.h"
+#include "batch/ordered_run.h"
+#include "batch/picture_failure.h"
+#include "core/text.h"
+#include "metadata/exif/picture_exif.h"
+#include "platform/clock.h"
+#include "platform/files.h"
+#include "platform/folders.h"
+#include "platform/paths.h"
+#include "platform/process.h"
+#include "processing/palette/reduce.h"
+#include "settings/settings.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr int kMostLostRaces = 100;
+constexpr int32_t kPageDigits = 5;
+// Cells that may wait for those before them: so many, and fewer when they are large.
+constexpr size_t kCellsAhead = 64;
+constexpr uint64_t kBytesAhead = uint64_t{64} << 20;
+
+// The path of the next page that nobody has; false when the numbers are used up.
+bool NextPageName(BatchJob& job, std::string& path) {
+  do {
+    if (++job.cataloguePage >= kLastCataloguePage) return false;
+    path = platform::JoinFolder(job.destinationFolder,
+                                CataloguePageName(PrefixOf(FileFunction::Catalog), job.cataloguePage, ExtensionOfFormat(job)));
+  } while (platform::FileExists(path));
+  return true;
+}
+
+Status WritePage(PictureRecord& page, const CataloguePageOptions& options, const Destination& destination, BatchJob& job) {
+  if (options.dryRun) return Status::Ok;
+  if (!job.destinationFolder.empty() && !platform::MakeFolders(job.destinationFolder)) return Status::ErrorCreatingFile;
+  WriteOptions write;
+  write.existing = destination.replace ? platform::Existing::Replace : platform::Existing::Refuse;
+  write.password = destination.password;
+  if (destination.recycle) write.makeWay = [&] { return platform::MoveToTrash(destination.path); };
+  return WritePictureAs(page, destination.path, job.formatIndex, write);
+}
+
+class ContactSheet {
+ public:
+  ContactSheet(std::span<const BatchFile> files, const ContactSheetOptions& options, BatchJob& job)
+      : files_(files), options_(options), job_(job), cells_(files.size()) {}
+
+  Status OpenFont() { return options_.look.names ? font_.Open(settings.CatalogFontName.view(), kCaptionHeight) : Status::Ok; }
+
+  void Run() {
+    const uint32_t jobs = options_.jobs == 0 ? platform::CoreCount() : options_.jobs;
+    const uint64_t cellBytes =
+        uint64_t{3} * static_cast<uint32_t>(options_.look.cellWidth) * static_cast<uint32_t>(options_.look.cellHeight);
+    const uint64_t room = kBytesAhead / std::max<uint64_t>(cellBytes, 1);
+    OrderedRun run({.work = [this](size_t i) { Work(i); },
+                    .deliver = [this](size_t i) { Deliver(i); },
+                    .goesOn = [this] { return !ended_ && !AbortAsked(); },
+                    .tick = [this] { Tick(); },
+                    .ahead = std::max<size_t>(std::min<uint64_t>(room, kCellsAhead), size_t{jobs} + 1)});
+    run.Run(files_.size(), jobs);
+    if (ended_ || AbortAsked()) GiveUpPage();
+    EndPage();
+  }
+
+ private:
+  // A picture on its way to its cell.
+  struct Cell {
+    FileOutcome outcome;
+    PackedImage image;
+  };
+
+  void Work(size_t i) {
+    auto cell = std::make_unique<Cell>();
+    cell->outcome = {.source = files_[i].name, .status = files_[i].status, .hint = files_[i].hint};
+    try {
+      if (cell->outcome.status == Status::Ok) Draw(cell->outcome, cell->image);
+    } catch (const std::bad_alloc&) {
+      cell->outcome.status = Status::MemoryAllocationError;
+    }
+    cells_[i] = std::move(cell);
+  }
+
+  void Draw(FileOutcome& outcome, PackedImage& image) const {
+    PicturePointer picture;
+    outcome.status = LoadPictureInfo(outcome.source.c_str(), picture);
+    if (outcome.status == Status::Ok && !options_.page.dryRun) outcome.status = DrawPicture(*picture, image);
+    if (outcome.status != Status::Ok) outcome.hint = OpenHint(outcome.source, outcome.status);
+  }
+
+  Status DrawPicture(PictureRecord& picture, PackedImage& image) const {
+    picture.thumbnailSide = std::max(options_.look.cellWidth, options_.look.cellHeight);
+    RETURN_IF_BAD(ReadPicture(picture));
+    if (settings.ExifAdjustOrientation != 0) RETURN_IF_BAD(TurnUpright(picture));
+    return MakeCellImage(picture, options_.look, image);
+  }
+
+  void Deliver(size_t i) {
+    const std::unique_ptr<Cell> cell = std::move(cells_[i]);
+    job_.source.AssignCut(cell->outcome.source);
+    if (cell->outcome.status == Status::Ok) cell->outcome.status = PutCell(*cell);
+    waiting_.push_back(std::move(cell->outcome));
+    if (drawn_ == options_.look.columns * options_.look.rows) EndPage();
+    Tick();
+  }
+
+  Status PutCell(const Cell& cell) {
+    if (page_ == nullptr) RETURN_IF_BAD(NewPage());
+    if (!cell.image.Empty()) {
+      DrawCell(options_.look, drawn_, cell.image, platform::FileNameOf(cell.outcome.source), &font_, page_->image);
+    }
+    ++drawn_;
+    return Status::Ok;
+  }
+
+  Status NewPage() {
+    PicturePointer page = NewPictureRecord();
+    if (page == nullptr) return Status::MemoryAllocationError;
+    if (!options_.page.dryRun) RETURN_IF_BAD(NewCataloguePage(options_.look, page->image));
+    const Rectangle size = PageSize(options_.look);
+    page->width = size.width;
+    page->height = size.height;
+    page->bitsPerPixel = 24;
+    page_ = std::move(page);
+    return Status::Ok;
+  }
+
+  // Writes the page, if there is one, and reports the files that waited for it.
+  void EndPage() {
+    Status status = Status::Ok;
+    std::string path;
+    const uint32_t writeAborts = job_.writeAborts;
+    if (page_ != nullptr) status = WriteCataloguePage(*page_, options_.page, job_, path);
+    const bool noName = job_.writeAborts != writeAborts;
+    for (FileOutcome& outcome : waiting_) {
+      if (outcome.status == Status::Ok) {
+        outcome.status = status;
+        outcome.destination = path;
+        if (status == Status::FunctionCancelled) {
+          outcome.status = noName ? Status::ErrorCreatingFile : Status::Ok;
+          outcome.skipped = true;
+          outcome.hint = noName ? kWriteAborted : "skipped, with its page.";
+          if (noName) outcome.destination.clear();
+        }
+        if (status == Status::TooManyColors) outcome.hint = options_.reduceHint;
+        if (status == Status::ErrorCreatingFile) outcome.hint = "\"" + path + "\" cannot be made.";
+      }
+      ReportOutcome(job_, outcome, reported_++, static_cast<uint32_t>(files_.size()));
+    }
+    waiting_.clear();
+    page_.reset();
+    drawn_ = 0;
+  }
+
+  // Of the files that waited for a page that is not written, those that failed are reported all the same.
+  void GiveUpPage() {
+    std::erase_if(waiting_, [](const FileOutcome& outcome) { return outcome.status == Status::Ok; });
+    page_.reset();
+  }
+
+  void Tick() {
+    if (job_.box == nullptr) return;
+    job_.box->Tick();
+    if (!job_.box->GoesOn()) ended_ = true;
+  }
+
+  const std::span<const BatchFile> files_;
+  const ContactSheetOptions& options_;
+  BatchJob& job_;
+  std::vector<std::unique_ptr<Cell>> cells_;  // done and not yet on a page
+  CaptionFont font_;
+  PicturePointer page_;               // the one that is being filled
+  int32_t drawn_ = 0;                 // its cells
+  std::vector<FileOutcome> waiting_;  // files whose page is not written yet
+  uint32_t reported_ = 0;
+  std::atomic<bool> ended_{false};
+};
+
+}  // namespace
+
+std::string CataloguePageName(std::string_view prefix, uint32_t number, std::string_view extension) {
+  std::string digits = std::to_string(number);
+  if (digits.size() < kPageDigits) digits.insert(0, kPageDigits - digits.size(), '0');
+  return std::string(prefix) + digits + "." + LowerCase(extension);
+}
+
+Status WriteCataloguePage(PictureRecord& page, const CataloguePageOptions& options, BatchJob& job, std::string& path) {
+  const TakenTest taken = [](const std::string& candidate) { return platform::FileExists(candidate); };
+  const VariantMaker variant = [&](std::string& candidate) {
+    return MakeNumberedVariant(candidate, job.naming.firstVariant, job.naming.lastVariant, taken);
+  };
+  for (int attempt = 0; attempt < kMostLostRaces; ++attempt) {
+    std::string name;
+    if (!NextPageName(job, name)) return Status::ErrorWritingFile;
+    Destination destination;
+    path = destination.path = name;
+    if (path.size() > PathText::Capacity()) return Status::InvalidDestination;
+    const DestinationAnswer answer = MakeDestinationName(destination, name, "Catalogue page", job, taken, variant, &page);
+    if (destination.noVariant) ++job.writeAborts;
+    if (answer == DestinationAnswer::Skip) return Status::FunctionCancelled;
+    path = destination.path;
+    const FormatEntry& row = FormatRow(job.formatIndex);
+    if (!CanWrite(row)) return Status::UnsupportedFunction;
+    const auto deepest = static_cast<int32_t>(row.maxBits);
+    if (!options.reduce && page.bitsPerPixel > deepest) return Status::TooManyColors;
+    if (!options.dryRun) RETURN_IF_BAD(ReduceColors(page, deepest));
+    const Status status = WritePage(page, options, destination, job);
+    const bool lostRace = status == Status::ErrorCreatingFile && !destination.replace && platform::FileExists(path);
+    if (lostRace) continue;  // the next number, then
+    if (status == Status::Ok && !options.dryRun) {
+      job.filesChanged = true;
+      job.uses.push_back(
+          {platform::AbsolutePath(path), FileFunction::Catalog, kOwnTime, static_cast<int32_t>(platform::Now()), false});
+    }
+    return status;
+  }
+  return Status::ErrorCreatingFile;
+}
+
+Status RunContactSheet(std::span<const BatchFile> files, const ContactSheetOptions& options, BatchJob& job) {
+  job.extension = ExtensionOfFormat(job);
+  ContactSheet sheet(files, options, job);
+  RETURN_IF_BAD(sheet.OpenFont());
+  if (!options.page.dryRun && !IsDestinationWanted(job, true)) return Status::FunctionCancelled;
+  if (!OpenProgressBox(job)) return Status::FunctionCancelled;
+  sheet.Run();
+  FinishProgress(job);
+  return Status::Ok;
+}
+
+}  // namespace fotomill

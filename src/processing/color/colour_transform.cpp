@@ -1,0 +1,199 @@
+#include "processing/color/colour_transform.h"
+
+#include <lcms2.h>
+
+#include <algorithm>
+#include <cstdlib>
+#include <functional>
+#include <memory>
+#include <system_error>
+#include <thread>
+#include <vector>
+
+#include "core/byte_reader.h"
+#include "platform/process.h"
+
+// The library works on whole pixels in the order of a packed image. It is told to keep no last colour in a transform, so
+// that threads can share one.
+//
+// Profiles come with pictures from anywhere. Those of an unlikely size are left alone, and so are the tags of type 'mpet': a
+// file of a few megabytes can ask for a chain of a million steps there, which would keep a core busy for hours. All other
+// tags take a time that the library bounds, and hardly any profile has only those.
+
+namespace fotomill {
+
+namespace {
+
+constexpr uint64_t kLargestProfile = 8 << 20;
+constexpr uint32_t kMostTags = 100;           // as many as the library reads
+constexpr uint64_t kHeaderSize = 128;         // of a profile; the tag table follows: count, then name, offset, size of each
+constexpr uint32_t kStepsType = 0x6d706574;   // "mpet"
+constexpr uint8_t kHiddenTag = 'x';           // begins no name of a tag
+constexpr uint64_t kPixelsPerCore = 1 << 18;  // fewer are not worth a thread
+constexpr int32_t kUnseen = 1;                // a difference of 8-bit values that rounding may make
+
+struct CloseProfile {
+  void operator()(void* profile) const { cmsCloseProfile(profile); }
+};
+using Profile = std::unique_ptr<void, CloseProfile>;
+
+// The profile's bytes without the tags that are not trusted; empty when it is none.
+std::vector<uint8_t> TrustedTags(std::span<const uint8_t> profile) {
+  if (profile.size() > kLargestProfile) return {};
+  std::vector<uint8_t> trusted(profile.begin(), profile.end());
+  ByteReader table(profile);
+  table.Seek(kHeaderSize);
+  const uint32_t count = table.Be32();
+  if (!table.Ok() || count > kMostTags) return {};
+  for (uint32_t i = 0; i < count; ++i) {
+    const uint64_t entry = table.Position();
+    table.Skip(4);
+    ByteReader tag(profile);
+    tag.Seek(table.Be32());
+    table.Skip(4);
+    if (!table.Ok()) return {};
+    if (tag.Be32() == kStepsType) trusted[entry] = kHiddenTag;
+  }
+  return trusted;
+}
+
+// Null for bytes that are no profile of devices with RGB or grey colours.
+Profile OpenProfile(std::span<const uint8_t> bytes) {
+  const std::vector<uint8_t> trusted = TrustedTags(bytes);
+  if (trusted.empty()) return nullptr;
+  Profile profile(cmsOpenProfileFromMem(trusted.data(), static_cast<cmsUInt32Number>(trusted.size())));
+  if (profile == nullptr) return nullptr;
+  constexpr cmsProfileClassSignature kDevices[] = {cmsSigInputClass, cmsSigDisplayClass, cmsSigOutputClass,
+                                                   cmsSigColorSpaceClass};
+  const bool device = std::ranges::find(kDevices, cmsGetDeviceClass(profile.get())) != std::end(kDevices);
+  const cmsColorSpaceSignature colours = cmsGetColorSpace(profile.get());
+  return device && (colours == cmsSigRgbData || colours == cmsSigGrayData) ? std::move(profile) : nullptr;
+}
+
+Profile OpenSource(std::span<const uint8_t> bytes) {
+  Profile source = OpenProfile(bytes);
+  return source != nullptr ? std::move(source) : Profile(cmsCreate_sRGBProfile());
+}
+
+Profile OpenScreen(std::span<const uint8_t> bytes) {
+  Profile screen = OpenProfile(bytes);
+  const bool fits = screen != nullptr && cmsGetColorSpace(screen.get()) == cmsSigRgbData;
+  return fits ? std::move(screen) : Profile(cmsCreate_sRGBProfile());
+}
+
+bool IsGrey(const uint8_t* bgr, int32_t pixels, int32_t step) {
+  for (int32_t i = 0; i < pixels; ++i, bgr += step) {
+    if (bgr[0] != bgr[1] || bgr[1] != bgr[2]) return false;
+  }
+  return true;
+}
+
+bool IsGrey(const PackedImage& image) {
+  for (int32_t r = 0; r < image.Height(); ++r) {
+    if (!IsGrey(image.StoredRow(r).data(), image.Width(), 3)) return false;
+  }
+  return true;
+}
+
+// Divides rows among the cores, `work` gets a first one and the one behind the last. What no thread can be had for is done
+// here.
+void ForBandsOfRows(int32_t rows, uint64_t pixels, const std::function<void(int32_t, int32_t)>& work) {
+  const uint64_t most = std::min<uint64_t>(platform::CoreCount(), static_cast<uint64_t>(rows));
+  const int32_t bands = static_cast<int32_t>(std::clamp<uint64_t>(pixels / kPixelsPerCore, 1, most));
+  const auto start = [&](int32_t band) { return static_cast<int32_t>(int64_t{rows} * band / bands); };
+  std::vector<std::thread> threads;
+  int32_t own = bands - 1;  // the bands from here on
+  for (int32_t band = 0; band < own; ++band) {
+    try {
+      threads.emplace_back(work, start(band), start(band + 1));
+    } catch (const std::system_error&) {
+      own = band;
+    }
+  }
+  work(start(own), rows);
+  for (std::thread& thread : threads) thread.join();
+}
+
+}  // namespace
+
+ColourTransform::ColourTransform(std::span<const uint8_t> source, std::span<const uint8_t> screen) {
+  const Profile from = OpenSource(source), to = OpenScreen(screen);
+  if (from == nullptr || to == nullptr) return;
+  grey_ = cmsGetColorSpace(from.get()) == cmsSigGrayData;
+  // Greys are few: they need no short cut, which would cost dark ones their precision.
+  const cmsUInt32Number flags = grey_ ? cmsFLAGS_NOCACHE | cmsFLAGS_NOOPTIMIZE : cmsFLAGS_NOCACHE;
+  transform_ = cmsCreateTransform(from.get(), grey_ ? TYPE_GRAY_8 : TYPE_BGR_8, to.get(), TYPE_BGR_8, INTENT_PERCEPTUAL, flags);
+  if (transform_ == nullptr || ChangesTestColours()) return;
+  cmsDeleteTransform(transform_);
+  transform_ = nullptr;
+}
+
+ColourTransform::~ColourTransform() {
+  if (transform_ != nullptr) cmsDeleteTransform(transform_);
+}
+
+void ColourTransform::Apply(PackedImage& image) const {
+  if (!ChangesColours() || image.Empty()) return;
+  if (image.Bits() != 24) return ApplyToColorTable(image);
+  if (grey_ && !IsGrey(image)) return;
+  const uint64_t pixels = static_cast<uint64_t>(image.Width()) * static_cast<uint64_t>(image.Height());
+  ForBandsOfRows(image.Height(), pixels, [&](int32_t first, int32_t end) { ApplyToRows(image, first, end); });
+}
+
+void ColourTransform::ApplyToColorTable(PackedImage& image) const {
+  uint8_t* const table = image.ColorTable().data();
+  const int32_t colors = image.Colors();
+  if (grey_ && !IsGrey(table, colors, 4)) return;
+  for (int32_t i = 0; i < colors; ++i) {
+    uint8_t* const bgr = table + 4 * i;
+    if (grey_) {
+      MapGreys(bgr, 1);
+    } else {
+      cmsDoTransform(transform_, bgr, bgr, 1);
+    }
+  }
+}
+
+void ColourTransform::ApplyToRows(PackedImage& image, int32_t first, int32_t end) const {
+  for (int32_t r = first; r < end; ++r) {
+    uint8_t* const bgr = image.StoredRow(r).data();
+    if (grey_) {
+      MapGreys(bgr, image.Width());
+    } else {
+      cmsDoTransform(transform_, bgr, bgr, static_cast<cmsUInt32Number>(image.Width()));
+    }
+  }
+}
+
+void ColourTransform::MapGreys(uint8_t* bgr, int32_t pixels) const {
+  for (uint8_t* const end = bgr + 3 * int64_t{pixels}; bgr < end; bgr += 3) std::copy_n(&greys_[3 * size_t{*bgr}], 3, bgr);
+}
+
+// Whether a grid of colours and the line of greys, or for grey pictures all greys, come out different.
+bool ColourTransform::ChangesTestColours() {
+  constexpr int32_t kSteps = 6, kGreySteps = 18;  // both end at 255
+  std::vector<uint8_t> colours, changed;
+  const auto add = [&](int32_t blue, int32_t green, int32_t red) {
+    for (const int32_t value : {blue, green, red}) colours.push_back(static_cast<uint8_t>(value));
+  };
+  for (int32_t i = 0; i < kGreys; ++i) {
+    if (grey_ || i % (255 / (kGreySteps - 1)) == 0) add(i, i, i);
+  }
+  for (int32_t i = 0; i < kSteps * kSteps * kSteps && !grey_; ++i) {
+    constexpr int32_t kStep = 255 / (kSteps - 1);
+    add(i % kSteps * kStep, i / kSteps % kSteps * kStep, i / kSteps / kSteps * kStep);
+  }
+  changed.resize(colours.size());
+  const auto pixels = static_cast<cmsUInt32Number>(colours.size() / 3);
+  if (grey_) {
+    std::array<uint8_t, kGreys> values;
+    for (int32_t i = 0; i < kGreys; ++i) values[static_cast<size_t>(i)] = static_cast<uint8_t>(i);
+    cmsDoTransform(transform_, values.data(), greys_.data(), pixels);
+    std::ranges::copy(greys_, changed.begin());
+  } else {
+    cmsDoTransform(transform_, colours.data(), changed.data(), pixels);
+  }
+  return !std::ranges::equal(colours, changed, [](uint8_t a, uint8_t b) { return std::abs(a - b) <= kUnseen; });
+}
+
+}  // namespace fotomill

@@ -1,0 +1,256 @@
+#include <algorithm>
+#include <cmath>
+#include <cstring>
+
+#include "platform/memory.h"
+#include "processing/geometry/filter_windows.h"
+#include "processing/geometry/resample_kernels.h"
+#include "processing/geometry/scale.h"
+#include "processing/promote.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr double kLeftToFilter = 4;      // a reduction by twice as much or more is begun by averaging blocks of pixels
+constexpr int32_t kMostByteShift = 20;   // precision of the weights for whole grey levels
+constexpr int32_t kMostShortShift = 15;  // and for samples: sums stay below 2^31
+
+// How the pixels along an edge are averaged: in blocks of `block`, of which the first begins `overhang` pixels before
+// the edge, so that what does not divide evenly is cut from both ends.
+struct Blocks {
+  int32_t block = 1, count = 0, overhang = 0;
+
+  Blocks() = default;
+  Blocks(int32_t sourceCount, int32_t resultCount) {
+    const double scale = static_cast<double>(sourceCount) / resultCount;
+    if (scale >= 2 * kLeftToFilter) block = static_cast<int32_t>(scale / kLeftToFilter);
+    count = (sourceCount - 1) / block + 1;
+    overhang = static_cast<int32_t>((static_cast<int64_t>(count) * block - sourceCount) / 2);
+  }
+  int32_t First(int32_t i) const { return std::max(i * block - overhang, 0); }
+  int32_t End(int32_t i, int32_t sourceCount) const { return std::min(i * block - overhang + block, sourceCount); }
+  // The edge in blocks, for the filter; `reach` pixels belong to the picture.
+  SourceEdge Edge(double reach) const { return {count, static_cast<double>(overhang) / block, reach / block}; }
+};
+
+bool IsOpaque(const PackedImage& alpha) {
+  for (int32_t y = 0; y < alpha.Height(); ++y) {
+    const auto row = alpha.Row(y).first(static_cast<size_t>(alpha.Width()));
+    if (!std::all_of(row.begin(), row.end(), [](uint8_t a) { return a == 255; })) return false;
+  }
+  return true;
+}
+
+// Delivers the rows of a picture as samples, averaged in blocks where it shrinks much. Rows are asked for in order.
+class SampleSource {
+ public:
+  // `alpha` may be null.
+  Status Open(const PackedImage& image, const PackedImage* alpha, const Blocks& across, const Blocks& down) {
+    image_ = &image;
+    alpha_ = alpha;
+    across_ = across;
+    down_ = down;
+    channels_ = alpha != nullptr ? 4 : 3;
+    samples_ = static_cast<size_t>(image.Width()) * channels_;
+    RETURN_IF_BAD(rows_.Open(image));
+    if (across.block == 1 && down.block == 1) return Status::Ok;
+    const bool room = wide_.Allocate(samples_ * sizeof(int16_t), platform::Fill::Unset) &&
+                      sums_.Allocate(samples_ * sizeof(int32_t), platform::Fill::Unset);
+    return room ? Status::Ok : Status::MemoryAllocationError;
+  }
+
+  void Read(int32_t y, int16_t* samples) {
+    if (across_.block == 1 && down_.block == 1) {
+      Convert(y, samples);
+      return;
+    }
+    const int32_t first = down_.First(y), end = down_.End(y, image_->Height());
+    int32_t* sums = sums_.Items<int32_t>().data();
+    std::memset(sums, 0, sums_.Bytes().size());
+    for (int32_t source = first; source < end; ++source) {
+      int16_t* wide = wide_.Items<int16_t>().data();
+      Convert(source, wide);
+      kernels_.add(wide, samples_, sums);
+    }
+    const auto average = channels_ == 4 ? AverageBlocks<4> : AverageBlocks<3>;
+    average(sums, image_->Width(), across_, end - first, samples);
+  }
+
+ private:
+  void Convert(int32_t y, int16_t* samples) {
+    if (alpha_ != nullptr) {
+      kernels_.multiply(rows_.Row(y), alpha_->Row(y).data(), static_cast<size_t>(image_->Width()), samples);
+    } else {
+      kernels_.widen(rows_.Row(y), samples_, samples);
+    }
+  }
+
+  template <int channels>
+  static void AverageBlocks(const int32_t* sums, int32_t width, const Blocks& across, int32_t rows, int16_t* averages) {
+    for (int32_t i = 0; i < across.count; ++i, averages += channels) {
+      const int32_t here = across.End(i, width) - across.First(i);
+      int64_t total[channels] = {};
+      for (int32_t x = 0; x < here; ++x, sums += channels) {
+        for (int c = 0; c < channels; ++c) total[c] += sums[c];
+      }
+      const double share = 1.0 / (static_cast<double>(here) * rows);
+      for (int c = 0; c < channels; ++c) averages[c] = static_cast<int16_t>(static_cast<double>(total[c]) * share + 0.5);
+    }
+  }
+
+  const ResampleKernels& kernels_ = ResampleKernelsHere();
+  const PackedImage* image_ = nullptr;
+  const PackedImage* alpha_ = nullptr;
+  Blocks across_, down_;
+  int32_t channels_ = 3;
+  size_t samples_ = 0;
+  BgrRows rows_;
+  platform::MemoryBlock wide_, sums_;
+};
+
+// Divides the colours by their alpha again. A pixel that nothing is seen of is black.
+void SplitAlpha(const int16_t* pixels, int32_t width, uint8_t* bgr, uint8_t* alpha) {
+  for (int32_t x = 0; x < width; ++x, pixels += 4, bgr += 3) {
+    const int32_t level = std::clamp((pixels[3] + (1 << (kFraction - 1))) >> kFraction, 0, 255);
+    alpha[x] = static_cast<uint8_t>(level);
+    const float scale = level == 0 ? 0 : 255.0f / static_cast<float>(pixels[3]);
+    for (int c = 0; c < 3; ++c) {
+      bgr[c] = static_cast<uint8_t>(std::clamp(static_cast<float>(pixels[c]) * scale + 0.5f, 0.0f, 255.0f));
+    }
+  }
+}
+
+// One picture on its way to another size, in two passes: down, rows are weighed into one; across, a row is scaled. A
+// picture that gets fewer rows goes down first, so that less is left to scale across; one that gets more goes across
+// first.
+class Resampling {
+ public:
+  Status Open(const PackedImage& image, const PackedImage* alpha, Reach reach, Size size, ScaleFilter filter) {
+    image_ = &image;
+    const Blocks columns(image.Width(), size.width), rows(image.Height(), size.height);
+    lastRow_ = rows.count - 1;
+    channels_ = alpha != nullptr ? 4 : 3;
+    width_ = size.width;
+    acrossFirst_ = size.height > rows.count;
+    const auto samples = static_cast<size_t>(acrossFirst_ ? size.width : columns.count) * channels_;
+    // Rows of a 24-bit picture can be weighed as they lie.
+    direct_ = !acrossFirst_ && image.Bits() == 24 && alpha == nullptr && columns.block == 1 && rows.block == 1 &&
+              samples >= kWeighedAtOnce;
+    RETURN_IF_BAD(across_.Make(columns.Edge(reach.width), size.width, filter, kMostShortShift));
+    RETURN_IF_BAD(down_.Make(rows.Edge(reach.height), size.height, filter, direct_ ? kMostByteShift : kMostShortShift));
+    if (!direct_) RETURN_IF_BAD(source_.Open(image, alpha, columns, rows));
+    held_ = down_.MostTaps();
+    stride_ = direct_ ? samples : (samples + kSpare + kWeighedAtOnce - 1) / kWeighedAtOnce * kWeighedAtOnce;
+    const uint64_t columnRow = static_cast<uint64_t>(columns.count + kTapGroup) * channels_ + kWeighedAtOnce + kSpare;
+    const uint64_t pixelRow = static_cast<uint64_t>(size.width) * channels_ + kWeighedAtOnce + kSpare;
+    const bool room = columns_.Allocate(columnRow * sizeof(int16_t)) && pixels_.Allocate(pixelRow * sizeof(int16_t)) &&
+                      pointers_.Allocate(static_cast<uint64_t>(held_) * sizeof(void*)) &&
+                      (direct_ || ring_.Allocate(stride_ * static_cast<uint64_t>(held_) * sizeof(int16_t)));
+    return room ? Status::Ok : Status::MemoryAllocationError;
+  }
+
+  // Row y of the result; rows are asked for in order.
+  void ScaleRow(int32_t y, std::span<uint8_t> bgr, std::span<uint8_t> alpha) {
+    int16_t* columns = columns_.Items<int16_t>().data();
+    int16_t* pixels = pixels_.Items<int16_t>().data();
+    if (acrossFirst_) {
+      Down(y, pixels);
+    } else {
+      Down(y, columns);
+      Across(columns, pixels);
+    }
+    if (channels_ == 3) {
+      kernels_.narrow(pixels, 3 * static_cast<size_t>(width_), bgr.data());
+    } else {
+      SplitAlpha(pixels, width_, bgr.data(), alpha.data());
+    }
+  }
+
+ private:
+  static constexpr size_t kSpare = 8;  // samples that a pass may write behind a row's end
+
+  void Across(const int16_t* columns, int16_t* pixels) {
+    const auto scale = channels_ == 3 ? kernels_.scaleThree : kernels_.scaleFour;
+    scale(columns, across_.Windows().data(), width_, across_.Shift(), pixels);
+  }
+
+  void Down(int32_t y, int16_t* row) {
+    const FilterWindow& window = down_.Window(y);
+    if (direct_) {
+      const auto rows = RowsOf<uint8_t>(window, [&](int32_t r) { return image_->Row(r).data(); });
+      kernels_.weighBytes(rows, window, down_.Shift() - kFraction, stride_, row);
+      return;
+    }
+    for (const int32_t end = std::min(window.first + window.taps, lastRow_ + 1); filled_ < end; ++filled_) Fill(filled_);
+    const auto rows = RowsOf<int16_t>(window, [&](int32_t r) { return Slot(r); });
+    kernels_.weighShorts(rows, window, down_.Shift(), stride_, row);
+  }
+
+  int16_t* Slot(int32_t y) { return ring_.Items<int16_t>().data() + static_cast<size_t>(y % held_) * stride_; }
+  void Fill(int32_t y) {
+    if (acrossFirst_) {
+      source_.Read(y, columns_.Items<int16_t>().data());
+      Across(columns_.Items<int16_t>().data(), Slot(y));
+    } else {
+      source_.Read(y, Slot(y));
+    }
+  }
+
+  // The rows of a window. Those without weight that would lie behind the last row are the last row.
+  template <typename Sample, typename RowAt>
+  const Sample* const* RowsOf(const FilterWindow& window, RowAt rowAt) {
+    const Sample** rows = pointers_.Items<const Sample*>().data();
+    for (int32_t t = 0; t < window.taps; ++t) rows[t] = rowAt(std::min(window.first + t, lastRow_));
+    return rows;
+  }
+
+  const ResampleKernels& kernels_ = ResampleKernelsHere();
+  const PackedImage* image_ = nullptr;
+  SampleSource source_;
+  FilterWindows across_, down_;
+  int32_t lastRow_ = 0, channels_ = 3, width_ = 0;
+  bool acrossFirst_ = false, direct_ = false;
+  int32_t held_ = 0, filled_ = 0;
+  size_t stride_ = 0;              // samples of a row that is weighed
+  platform::MemoryBlock ring_;     // `held_` rows that the windows of rows may need
+  platform::MemoryBlock columns_;  // one row as wide as the source, zeros behind its end
+  platform::MemoryBlock pixels_;   // one row as wide as the result
+  platform::MemoryBlock pointers_;
+};
+
+}  // namespace
+
+Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Size size, ScaleFilter filter, PackedImage& scaled,
+                     PackedImage& scaledAlpha, ProgressSink* progress) {
+  const Reach all{static_cast<double>(image.Width()), static_cast<double>(image.Height())};
+  return ScaleFiltered(image, alpha, all, size, filter, scaled, scaledAlpha, progress);
+}
+
+Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Reach reach, Size size, ScaleFilter filter,
+                     PackedImage& scaled, PackedImage& scaledAlpha, ProgressSink* progress) {
+  scaled.Free();
+  scaledAlpha.Free();
+  if (image.Empty()) return Status::DamagedFile;
+  PackedImage made, madeAlpha;
+  if (filter == ScaleFilter::Nearest) {
+    RETURN_IF_BAD(ScaleNearest(image, size, made));
+    if (!alpha.Empty()) RETURN_IF_BAD(ScaleNearest(alpha, size, madeAlpha));
+  } else {
+    RETURN_IF_BAD(NewPackedImage(size.width, size.height, nullptr, 24, made));
+    if (!alpha.Empty()) RETURN_IF_BAD(NewAlphaPlane(size.width, size.height, madeAlpha));
+    const bool blended = !alpha.Empty() && !IsOpaque(alpha);
+    if (!alpha.Empty() && !blended) std::memset(madeAlpha.Rows().data(), 255, madeAlpha.Rows().size());
+    Resampling work;
+    RETURN_IF_BAD(work.Open(image, blended ? &alpha : nullptr, reach, size, filter));
+    for (int32_t y = 0; y < size.height; ++y) {
+      work.ScaleRow(y, made.Row(y), blended ? madeAlpha.Row(y) : std::span<uint8_t>());
+      if (progress != nullptr) progress->Step(y + 1, size.height);
+    }
+  }
+  scaled = std::move(made);
+  scaledAlpha = std::move(madeAlpha);
+  return Status::Ok;
+}
+
+}  // namespace fotomill

@@ -1,0 +1,120 @@
+#include "processing/palette/dither.h"
+
+#include <algorithm>
+#include <array>
+#include <cstdlib>
+
+namespace fotomill {
+
+namespace {
+
+// Bayer's pattern: the order in which the pixels of a square of 8 x 8 turn white, 0 to 63.
+constexpr std::array<std::array<int32_t, 8>, 8> MakePattern() {
+  std::array<std::array<int32_t, 8>, 8> pattern{};
+  for (int y = 0; y < 8; ++y) {
+    for (int x = 0; x < 8; ++x) {
+      int order = 0;
+      for (int bit = 0; bit < 3; ++bit) {
+        const int across = x >> bit & 1, down = y >> bit & 1;
+        order = order << 2 | (across ^ down) << 1 | down;
+      }
+      pattern[static_cast<size_t>(y)][static_cast<size_t>(x)] = order;
+    }
+  }
+  return pattern;
+}
+constexpr auto kPattern = MakePattern();
+static_assert(kPattern[0][0] == 0 && kPattern[0][1] == 32 && kPattern[1][0] == 48 && kPattern[1][1] == 16);
+
+constexpr int32_t Clamp(int32_t value) { return std::clamp(value, 0, 255); }
+
+}  // namespace
+
+void MapRow(const uint8_t* bgr, int32_t width, NearestColor& nearest, uint8_t* indices) {
+  for (int32_t x = 0; x < width; ++x, bgr += 3) indices[x] = nearest.Find(bgr[0], bgr[1], bgr[2]);
+}
+
+void OrderRow(const uint8_t* bgr, int32_t width, int32_t y, int32_t spread, NearestColor& nearest, uint8_t* indices) {
+  int32_t offsets[8];
+  for (size_t i = 0; i < 8; ++i) offsets[i] = (2 * kPattern[static_cast<size_t>(y & 7)][i] - 63) * spread / 128;
+  for (int32_t x = 0; x < width; ++x, bgr += 3) {
+    const int32_t offset = offsets[x & 7];
+    indices[x] = nearest.Find(Clamp(bgr[0] + offset), Clamp(bgr[1] + offset), Clamp(bgr[2] + offset));
+  }
+}
+
+void OrderGreyRow(const uint8_t* grey, int32_t width, int32_t y, uint8_t* indices) {
+  // The 65 shades of the pattern lie evenly between black and white: 0 is never white, 255 always is.
+  int32_t limits[8];
+  for (size_t i = 0; i < 8; ++i) limits[i] = (2 * kPattern[static_cast<size_t>(y & 7)][i] + 1) * 255 / 128 + 1;
+  for (int32_t x = 0; x < width; ++x) indices[x] = grey[x] >= limits[x & 7];
+}
+
+void CutGreyRow(const uint8_t* grey, int32_t width, int32_t threshold, uint8_t* indices) {
+  for (int32_t x = 0; x < width; ++x) indices[x] = grey[x] >= threshold;
+}
+
+Status ErrorDiffuser::Open(int32_t width, bool serpentine, int32_t handedOn) {
+  const uint64_t bytes = 3 * (static_cast<uint64_t>(width) + 2) * sizeof(int32_t);
+  if (!errors_.Allocate(bytes)) return Status::MemoryAllocationError;
+  below_ = errors_.Items<int32_t>().data() + 3;
+  width_ = width;
+  serpentine_ = serpentine;
+  handedOn_ = handedOn;
+  backwards_ = false;
+  return Status::Ok;
+}
+
+void ErrorDiffuser::Row(const uint8_t* bgr, NearestColor& nearest, uint8_t* indices) {
+  backwards_ ? DiffuseRow<-1>(bgr, nearest, indices) : DiffuseRow<1>(bgr, nearest, indices);
+  backwards_ = serpentine_ && !backwards_;
+}
+
+void ErrorDiffuser::GreyRow(const uint8_t* grey, uint8_t* indices) {
+  backwards_ ? DiffuseGreyRow<-1>(grey, indices) : DiffuseGreyRow<1>(grey, indices);
+  backwards_ = serpentine_ && !backwards_;
+}
+
+// A pixel hands 7/16 of its error ahead, and 3/16, 5/16 and 1/16 down: to the pixel below the last, below itself and
+// below the next. What was handed down to a pixel is read before its own row hands on to the same place.
+template <int step>
+void ErrorDiffuser::DiffuseRow(const uint8_t* bgr, NearestColor& nearest, uint8_t* indices) {
+  int32_t ahead[3] = {}, belowLast[3] = {}, belowHere[3] = {};
+  int32_t x = step > 0 ? 0 : width_ - 1;
+  for (int32_t left = width_; left > 0; --left, x += step) {
+    int32_t* below = below_ + 3 * static_cast<std::ptrdiff_t>(x);
+    int32_t wanted[3];
+    for (int c = 0; c < 3; ++c)
+      wanted[c] = Clamp(bgr[3 * static_cast<std::ptrdiff_t>(x) + c] + ((ahead[c] + below[c] + 128) >> 8));
+    const uint8_t index = nearest.Find(wanted[0], wanted[1], wanted[2]);
+    indices[x] = index;
+    const int16_t* color = nearest.ColorOf(index);
+    for (int c = 0; c < 3; ++c) {
+      const int32_t error = handedOn_ * (wanted[c] - color[c]);
+      ahead[c] = 7 * error;
+      below[c - 3 * step] = belowLast[c] + 3 * error;
+      belowLast[c] = belowHere[c] + 5 * error;
+      belowHere[c] = error;
+    }
+  }
+  for (int c = 0; c < 3; ++c) below_[3 * static_cast<std::ptrdiff_t>(x - step) + c] = belowLast[c];
+}
+
+template <int step>
+void ErrorDiffuser::DiffuseGreyRow(const uint8_t* grey, uint8_t* indices) {
+  int32_t ahead = 0, belowLast = 0, belowHere = 0;
+  int32_t x = step > 0 ? 0 : width_ - 1;
+  for (int32_t left = width_; left > 0; --left, x += step) {
+    const int32_t wanted = grey[x] + ((ahead + below_[x] + 128) >> 8);
+    const bool white = wanted >= 128;
+    indices[x] = white;
+    const int32_t error = handedOn_ * (wanted - (white ? 255 : 0));
+    ahead = 7 * error;
+    below_[x - step] = belowLast + 3 * error;
+    belowLast = belowHere + 5 * error;
+    belowHere = error;
+  }
+  below_[x - step] = belowLast;
+}
+
+}  // namespace fotomill

@@ -1,0 +1,290 @@
+#include "processing/palette/reduce.h"
+
+#include <algorithm>
+#include <array>
+#include <cmath>
+
+#include "processing/color/color_histogram.h"
+#include "processing/color/nearest_color.h"
+#include "processing/flatten.h"
+#include "processing/palette/dither.h"
+#include "processing/palette/fit_palette.h"
+#include "processing/promote.h"
+#include "settings/settings.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr int32_t kWhole = 100;              // per cent
+constexpr int kRefinements = 3;              // rounds in which the pixels themselves move the palette's colours
+constexpr int64_t kRefinedPixels = 200'000;  // about as many pixels take part
+constexpr int32_t kFewCells = 1024;          // a picture of fewer cells of colours has its colours counted one by one
+
+// Sixteenths of its error that a pixel hands on. All of it keeps the mean of black and white. A palette that was fitted
+// to the picture does not reach its outermost colours, and errors that it can never make up for would grow into noise;
+// less is handed on there, the less the closer the colours lie.
+constexpr int32_t kHandedOnMono = 16, kHandedOnFew = 12, kHandedOnMany = 10;
+constexpr int32_t kFew = 16;  // colours
+
+// Brightness 0 to 255 (ITU-R BT.601); of a grey it is the grey itself.
+constexpr uint8_t Brightness(const uint8_t* bgr) {
+  return static_cast<uint8_t>((29 * bgr[0] + 150 * bgr[1] + 77 * bgr[2] + 128) >> 8);
+}
+
+// The rows of a picture as they are to be reduced: 24 bits, adjusted, and grey where wanted.
+class SourceRows {
+ public:
+  Status Open(const PackedImage& image, const ReduceOptions& options) {
+    RETURN_IF_BAD(rows_.Open(image));
+    width_ = image.Width();
+    greys_ = options.greys;
+    adjusted_ = options.brightness != 0 || options.contrast != 0;
+    for (int32_t i = 0; i < 256; ++i) {
+      const int32_t spread = (2 * i - 255) * (kWhole + options.contrast) / (2 * kWhole);
+      levels_[static_cast<size_t>(i)] =
+          static_cast<uint8_t>(std::clamp(spread + 128 + options.brightness * 255 / kWhole, 0, 255));
+    }
+    if (!adjusted_ && !greys_) return Status::Ok;
+    return row_.Allocate(3 * static_cast<uint64_t>(width_)) ? Status::Ok : Status::MemoryAllocationError;
+  }
+
+  const uint8_t* Row(int32_t y) {
+    const uint8_t* source = rows_.Row(y);
+    if (!adjusted_ && !greys_) return source;
+    uint8_t* row = row_.Data();
+    const size_t bytes = 3 * static_cast<size_t>(width_);
+    for (size_t i = 0; i < bytes; ++i) row[i] = adjusted_ ? levels_[source[i]] : source[i];
+    for (size_t i = 0; greys_ && i < bytes; i += 3) row[i] = row[i + 1] = row[i + 2] = Brightness(row + i);
+    return row;
+  }
+
+  void BrightnessRow(int32_t y, uint8_t* brightness) {
+    const uint8_t* row = Row(y);
+    for (int32_t x = 0; x < width_; ++x) brightness[x] = Brightness(row + 3 * static_cast<size_t>(x));
+  }
+
+ private:
+  BgrRows rows_;
+  int32_t width_ = 0;
+  bool greys_ = false, adjusted_ = false;
+  std::array<uint8_t, 256> levels_{};
+  platform::MemoryBlock row_;
+};
+
+// The limit between dark and bright that leaves the least variance on its two sides.
+int32_t BestThreshold(const std::array<uint64_t, 256>& counts) {
+  double all = 0, sum = 0;
+  for (size_t i = 0; i < 256; ++i) {
+    all += static_cast<double>(counts[i]);
+    sum += static_cast<double>(i) * static_cast<double>(counts[i]);
+  }
+  double below = 0, belowSum = 0, best = -1;
+  int32_t threshold = 128;
+  for (size_t i = 0; i < 255; ++i) {
+    below += static_cast<double>(counts[i]);
+    belowSum += static_cast<double>(i) * static_cast<double>(counts[i]);
+    if (below <= 0 || below >= all) continue;
+    const double difference = belowSum / below - (sum - belowSum) / (all - below);
+    const double between = below * (all - below) * difference * difference;
+    if (between > best) {
+      best = between;
+      threshold = static_cast<int32_t>(i) + 1;
+    }
+  }
+  return threshold;
+}
+
+// The usual distance between a colour and the one nearest to it, which an ordered pattern has to bridge.
+int32_t PaletteSpacing(const Palette& palette, int32_t count) {
+  double sum = 0;
+  for (int32_t i = 0; i < count; ++i) {
+    int32_t least = 3 * 255 * 255;
+    for (int32_t j = 0; j < count; ++j) {
+      int32_t distance = 0;
+      for (int32_t c = 0; c < 3; ++c) {
+        const int32_t d = palette[static_cast<size_t>(3 * i + c)] - palette[static_cast<size_t>(3 * j + c)];
+        distance += d * d;
+      }
+      if (j != i) least = std::min(least, distance);
+    }
+    sum += std::sqrt(static_cast<double>(least));
+  }
+  return static_cast<int32_t>(sum / count);
+}
+
+Palette EvenGreys(int32_t count) {
+  Palette palette{};
+  for (int32_t i = 0; i < count; ++i) {
+    const auto level = static_cast<uint8_t>((i * 255 + (count - 1) / 2) / (count - 1));
+    std::fill_n(palette.begin() + 3 * i, 3, level);
+  }
+  return palette;
+}
+
+void SortByBrightness(ColorPoints& points) {
+  const auto brightness = [](const auto& bgr) { return 29 * bgr[0] + 150 * bgr[1] + 77 * bgr[2]; };
+  std::sort(points.channel.begin(), points.channel.begin() + points.count,
+            [&](const auto& a, const auto& b) { return brightness(a) < brightness(b); });
+}
+
+// A picture being reduced: where its rows come from and what it becomes.
+struct Reduction {
+  PictureRecord& picture;
+  const ReduceOptions& options;
+  int32_t bits;
+  SourceRows source;
+  platform::MemoryBlock indices;  // one row
+  PackedImage made;
+  Palette palette{};
+  int32_t colors = 2;
+
+  int32_t Width() const { return picture.image.Width(); }
+  int32_t Height() const { return picture.image.Height(); }
+  void StoreRow(int32_t y) {
+    PackIndices(indices.Data(), Width(), bits, made.Row(y).data());
+    picture.ReportRow(y + 1);
+  }
+};
+
+Status ReduceToMono(Reduction& work) {
+  const int32_t width = work.Width(), height = work.Height();
+  platform::MemoryBlock grey;
+  if (!grey.Allocate(static_cast<uint64_t>(width), platform::Fill::Unset)) return Status::MemoryAllocationError;
+  ErrorDiffuser diffuser;
+  RETURN_IF_BAD(diffuser.Open(width, work.options.serpentine, kHandedOnMono));
+  int32_t threshold = work.options.threshold;
+  if (work.options.monoDither == Dither::None && threshold == 0) {
+    std::array<uint64_t, 256> counts{};
+    for (int32_t y = 0; y < height; ++y) {
+      work.source.BrightnessRow(y, grey.Data());
+      for (const uint8_t level : grey.Bytes()) ++counts[level];
+    }
+    threshold = BestThreshold(counts);
+  }
+  for (int32_t y = 0; y < height; ++y) {
+    work.source.BrightnessRow(y, grey.Data());
+    switch (work.options.monoDither) {
+      case Dither::None: CutGreyRow(grey.Data(), width, threshold, work.indices.Data()); break;
+      case Dither::Ordered: OrderGreyRow(grey.Data(), width, y, work.indices.Data()); break;
+      case Dither::FloydSteinberg: diffuser.GreyRow(grey.Data(), work.indices.Data()); break;
+    }
+    work.StoreRow(y);
+  }
+  return Status::Ok;
+}
+
+template <typename Histogram>
+Status GatherColors(Reduction& work, std::vector<ColorBin>& bins) {
+  Histogram histogram;
+  RETURN_IF_BAD(histogram.Open());
+  for (int32_t y = 0; y < work.Height(); ++y) histogram.AddRow(work.source.Row(y), work.Width());
+  bins = histogram.Bins();
+  return Status::Ok;
+}
+
+// Takes the pixels themselves to the colours nearest to them, and the colours to their means.
+Status RefineOnPixels(Reduction& work, NearestColor& nearest, ColorPoints& points) {
+  const int64_t pixels = static_cast<int64_t>(work.Width()) * work.Height();
+  const auto step = static_cast<int32_t>(pixels / kRefinedPixels + 1);
+  for (int round = 0; round < kRefinements; ++round) {
+    nearest.SetColors(PointsOf(PaletteOf(points), points.count));
+    ColorMeans means;
+    for (int32_t y = step / 2; y < work.Height(); y += step) {
+      const uint8_t* row = work.source.Row(y);
+      MapRow(row, work.Width(), nearest, work.indices.Data());
+      means.AddRow(row, work.indices.Data(), work.Width());
+    }
+    means.Move(points);
+  }
+  return Status::Ok;
+}
+
+// Puts the palette for more than two colours into `work`, and its colours into `nearest`.
+Status ChoosePalette(Reduction& work, NearestColor& nearest) {
+  const int32_t most = 1 << work.bits;
+  RETURN_IF_BAD(nearest.Open(true));
+  ColorPoints points;
+  if (work.options.greys) {
+    const int32_t count = work.options.greyLevels == 0 ? most : std::min(most, work.options.greyLevels);
+    points = PointsOf(EvenGreys(count), count);
+  } else {
+    std::vector<ColorBin> bins;
+    RETURN_IF_BAD(GatherColors<ColorCells>(work, bins));
+    if (bins.size() < kFewCells) RETURN_IF_BAD(GatherColors<ColorCounts>(work, bins));
+    RETURN_IF_BAD(FitPalette(bins, most, points));
+    RETURN_IF_BAD(RefineOnPixels(work, nearest, points));
+    SortByBrightness(points);
+  }
+  work.palette = PaletteOf(points);
+  work.colors = points.count;
+  nearest.SetColors(PointsOf(work.palette, points.count));
+  return Status::Ok;
+}
+
+Status ReduceToPalette(Reduction& work, NearestColor& nearest) {
+  ErrorDiffuser diffuser;
+  RETURN_IF_BAD(diffuser.Open(work.Width(), work.options.serpentine, work.colors <= kFew ? kHandedOnFew : kHandedOnMany));
+  const int32_t spacing = PaletteSpacing(work.palette, work.colors);
+  for (int32_t y = 0; y < work.Height(); ++y) {
+    const uint8_t* row = work.source.Row(y);
+    switch (work.options.colorDither) {
+      case Dither::None: MapRow(row, work.Width(), nearest, work.indices.Data()); break;
+      case Dither::Ordered: OrderRow(row, work.Width(), y, spacing, nearest, work.indices.Data()); break;
+      case Dither::FloydSteinberg: diffuser.Row(row, nearest, work.indices.Data()); break;
+    }
+    work.StoreRow(y);
+  }
+  return Status::Ok;
+}
+
+Dither DitherFromKey(int32_t value) { return value == 0 ? Dither::None : value == 1 ? Dither::Ordered : Dither::FloydSteinberg; }
+
+}  // namespace
+
+ReduceOptions ReduceOptionsFromSettings() {
+  ReduceOptions options;
+  options.colorDither = DitherFromKey(settings.FXColorDither);
+  options.monoDither = DitherFromKey(settings.FXMonoDither);
+  options.serpentine = settings.FXBidirectional != 0;
+  options.greys = settings.FXMonomode != 0;
+  options.greyLevels = settings.FXGrayLevel <= 0 ? 0 : std::clamp(settings.FXGrayLevel, 2, 256);
+  options.threshold = std::clamp(settings.FXThreshold, 0, 255);
+  options.brightness = std::clamp(settings.DitherBrightness, -kWhole, kWhole);
+  options.contrast = std::clamp(settings.DitherContrast, -kWhole, kWhole);
+  return options;
+}
+
+Status ReduceColors(PictureRecord& picture, int32_t maxBits, const ReduceOptions& options) {
+  if (picture.image.Empty()) return Status::EmptyImage;
+  const int32_t bits = maxBits >= 24 ? 24 : maxBits >= 8 ? 8 : maxBits >= 4 ? 4 : 1;
+  if (picture.image.Bits() <= bits) return Status::Ok;
+  RETURN_IF_BAD(FlattenAlpha(picture));
+  if (picture.image.Bits() <= bits) return Status::Ok;
+  bool packed = false;
+  if (!options.greys) RETURN_IF_BAD(PackFewColors(picture, bits, packed));
+  if (packed) return Status::Ok;
+
+  const ProgressScope progress(picture);
+  Reduction work{picture, options, bits, {}, {}, {}};
+  RETURN_IF_BAD(work.source.Open(picture.image, options));
+  if (!work.indices.Allocate(static_cast<uint64_t>(work.Width()), platform::Fill::Unset)) return Status::MemoryAllocationError;
+  NearestColor nearest;
+  if (bits == 1) {
+    work.palette = EvenGreys(2);
+  } else {
+    RETURN_IF_BAD(ChoosePalette(work, nearest));
+  }
+  RETURN_IF_BAD(NewPackedImage(work.Width(), work.Height(), &work.palette, bits, work.made));
+  RETURN_IF_BAD(bits == 1 ? ReduceToMono(work) : ReduceToPalette(work, nearest));
+  picture.image = std::move(work.made);
+  picture.palette = work.palette;
+  picture.bitsPerPixel = bits;
+  return Status::Ok;
+}
+
+Status ReduceColors(PictureRecord& picture, int32_t maxBits) {
+  return ReduceColors(picture, maxBits, ReduceOptionsFromSettings());
+}
+
+}  // namespace fotomill

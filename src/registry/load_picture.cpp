@@ -1,0 +1,66 @@
+#include "processing/flatten.h"
+#include "registry/registry.h"
+
+namespace fotomill {
+
+Status LoadPictureInfo(const char* fileName, PicturePointer& picture, uint32_t flags) {
+  picture.reset();
+  const int32_t index = FindFormatByName(fileName);
+  if (index == kNoFormat) return Status::UnsupportedFormat;
+  PicturePointer made = NewPictureRecord();
+  if (made == nullptr) return Status::MemoryAllocationError;
+  if (!made->fileName.Assign(fileName)) return Status::FileOpenError;
+  made->formatIndex = index;
+  const FormatEntry& row = FormatRow(index);
+  if (row.info != nullptr) RETURN_IF_BAD(row.info(*made, fileName, flags));
+  picture = std::move(made);
+  return Status::Ok;
+}
+
+Status LoadPicture(const char* fileName, PicturePointer& picture, void* window) {
+  PicturePointer made;
+  picture.reset();
+  RETURN_IF_BAD(LoadPictureInfo(fileName, made));
+  made->window = window;
+  RETURN_IF_BAD(ReadPicture(*made));
+  picture = std::move(made);
+  return Status::Ok;
+}
+
+Status ReadPicture(PictureRecord& picture) {
+  if (picture.formatIndex == kNoFormat) return Status::UnsupportedFormat;
+  if (picture.page < 0 || picture.page >= picture.pageCount) return Status::NoImages;
+  const FormatEntry& row = FormatRow(picture.formatIndex);
+  if (row.read == nullptr || (row.flags & FMT_RENDERED) != 0) return Status::Ok;
+  const PathText fileName = picture.fileName;  // the codec may use the record's own for a working file
+  return row.read(picture, fileName.c_str());
+}
+
+Status OpenAnimation(const char* fileName, AnimationPointer& animation) {
+  animation.reset();
+  const int32_t index = FindFormatByName(fileName);
+  if (index == kNoFormat) return Status::UnsupportedFormat;
+  const AnimateOperation animate = FormatRow(index).animate;
+  return animate == nullptr ? Status::UnsupportedFunction : animate(fileName, animation);
+}
+
+Status WritePicture(PictureRecord& picture, std::string_view destination, const WriteOptions& options) {
+  return WritePictureAs(picture, destination, FindFormatByName(destination), options);
+}
+
+Status WritePictureAs(PictureRecord& picture, std::string_view destination, int32_t formatIndex, const WriteOptions& options) {
+  if (formatIndex == kNoFormat) return Status::UnsupportedFormat;
+  const FormatEntry& row = FormatRow(formatIndex);
+  if (picture.bitsPerPixel > static_cast<int32_t>(row.maxBits)) return Status::TooManyColors;
+  if (row.write == nullptr) return Status::UnsupportedFunction;
+  if (picture.image.Empty() && picture.metafile.Empty()) return Status::EmptyImage;
+  if (destination.size() > PathText::Capacity()) return Status::InvalidDestination;
+  if ((row.flags & FMT_ALPHA) == 0) RETURN_IF_BAD(FlattenAlpha(picture));
+  if (picture.bitsPerPixel > static_cast<int32_t>(row.maxBits)) return Status::TooManyColors;  // flattened palette pictures
+  picture.workName = picture.fileName;
+  picture.fileName.AssignCut(destination);
+  picture.lostMetadata = KeepsMetadata(row) ? uint8_t{0} : uint8_t{kLostExif | kLostXmp | kLostIcc};
+  return row.write(picture, options);
+}
+
+}  // namespace fotomill

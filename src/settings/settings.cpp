@@ -1,0 +1,8 @@
+#include "settings/settings.h"
+
+namespace fotomill {
+
+constinit Settings settings;
+constinit const Settings defaultSettings;
+
+}  // namespace fotomill

@@ -1,0 +1,26 @@
+#pragma once
+
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <string_view>
+
+#include "settings/key_table.h"
+
+namespace fotomill {
+
+// What a spin control offers.
+struct SpinRange {
+  int32_t minimum = 0, maximum = 0, step = 1;
+};
+
+// The range of a KEY_SPIN row. Setup dialogs put its text into the control numbered `control` + kSpinRangeControl, from
+// where the binding reads it, so that a dialog may offer less.
+SpinRange SpinRangeOf(const KeyRow& row);
+inline constexpr uint32_t kSpinRangeControl = 10000;
+
+// "minimum,maximum,step" and back; nullopt when the text does not hold three numbers.
+std::string SpinRangeText(const SpinRange& range);
+std::optional<SpinRange> ParseSpinRange(std::string_view text);
+
+}  // namespace fotomill

@@ -1,0 +1,220 @@
+#include "registry/registry.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include "settings/settings.h"
+#include "support/files.h"
+#include "support/pictures.h"
+#include "support/scoped_settings.h"
+
+namespace fotomill::test {
+namespace {
+
+using testing::ElementsAre;
+
+TEST(FindFormat, FirstRowThatMatchesWins) {
+  constexpr int32_t kNone = kNoFormat;
+  const struct {
+    const char* name;
+    int32_t row;
+    int32_t rowWithPlugins;  // with AllowPluginFormatOverride, which leaves out rows that are switched off
+  } rows[] = {
+      {"a.bmp", 2, 2},
+      {"A.BMP", 2, 2},
+      {"photo.jpeg", 56, 57},  // JPE comes before JPEG
+      {"photo.jfif", 54, 55},
+      {"photo.jpe", 56, 57},  // JPE is off, and the first three characters of JPEG are the same
+      {"photo.jpg", 15, 15},
+      {"scan.tiff", 32, 32},
+      {"sky.fits", 8, 8},
+      {"sky.fts", 51, 51},
+      {"fax.cals", 42, 42},
+      {"x.exe", 7, kNone},
+      {"x.mpeg", 65, 65},
+      {"x.mpg", 66, 66},
+      {"x.avif", 0, 0},  // three characters suffice
+      {"x.webm", 36, 36},
+      {"x.wbm", 35, 35},
+      {"x.we", kNone, kNone},  // a shorter one has to match to its end
+      {"x.bm", kNone, kNone},
+      {"x.b", kNone, kNone},
+      {"x.bmpx", 2, 2},
+      {"x.", kNone, kNone},
+      {"x", kNone, kNone},
+      {"", kNone, kNone},
+      {"bmp", kNone, kNone},
+      {".bmp", 2, 2},
+      {"a.bmp/x", kNone, kNone},  // the dot of a folder
+      {"a.b/x.pcx", 21, 21},
+      {"x.pcx.bak", kNone, kNone},
+      {"x.clpbrd", kNone, kNone},
+      {"x.clp", kNone, kNone},
+      {"x.wllppr", 40, 40},
+      {"x.b\xc3\xa4p", kNone, kNone},
+  };
+  const ScopedSettings keep;
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    settings.AllowPluginFormatOverride = 0;
+    EXPECT_EQ(FindFormatByName(row.name), row.row);
+    settings.AllowPluginFormatOverride = 1;
+    EXPECT_EQ(FindFormatByName(row.name), row.rowWithPlugins);
+  }
+}
+
+TEST(FindFormat, PlugInsAreAskedLastAndListedLast) {
+  const size_t filter = OpenFileFilter().size(), destinations = DestinationExtensions().size();
+  constexpr PluginSource kSource{
+      [](std::string_view name, int32_t parameter) { return name == "x.heic" && parameter == 5 ? kSpareRow : kNoFormat; },
+      [] {
+        return std::vector<PluginFormatFacts>{{"HEIC", "", 24, false}, {"QOI", "Quite OK", 24, true}};
+      }};
+  InstallPluginSource(&kSource);
+  EXPECT_EQ(FindFormatByName("x.heic", 5), kSpareRow);
+  EXPECT_EQ(FindFormatByName("x.heic", 4), kNoFormat);
+  EXPECT_EQ(FindFormatByName("x.bmp", 5), 2);
+  EXPECT_EQ(OpenFileFilter().size(), filter + 2);
+  EXPECT_EQ(OpenFileFilter().back().description, "(QOI) Plugin Quite OK");
+  EXPECT_EQ(DestinationExtensions().size(), destinations + 1);
+  EXPECT_EQ(DestinationExtensions().back(), "qoi");
+  InstallPluginSource(nullptr);
+  EXPECT_EQ(FindFormatByName("x.heic", 5), kNoFormat);
+  EXPECT_EQ(OpenFileFilter().size(), filter);
+}
+
+TEST(FormatLists, LeaveOutWhatTheirFlagsSay) {
+  const std::vector<int32_t> destinations = DestinationRows();
+  EXPECT_EQ(destinations.size(), 35u);
+  const std::vector<FilterPair> filter = OpenFileFilter();
+  EXPECT_EQ(filter.size(), 1u + 75u);  // all pictures; no clipboard, wallpaper or spare row
+  EXPECT_TRUE(filter[0].patterns.starts_with("*.AVI;*.BGA;*.BMP;")) << filter[0].patterns;
+  EXPECT_TRUE(filter[0].patterns.ends_with("*.RAR;*.ZIP")) << filter[0].patterns;
+  EXPECT_EQ(filter[3].description, "(BMP) Windows bitmap");
+  EXPECT_EQ(filter[3].patterns, "*.BMP");
+  const struct {
+    int32_t row;
+    bool destination, formatList, choice;
+  } rows[] = {
+      {9, false, true, true},     // GIF is animated
+      {24, true, true, true},     // PNG as well, but is saved anyway
+      {7, true, true, false},     // EXE is off
+      {39, false, false, false},  // clipboard
+      {40, false, true, true},    // wallpaper
+      {41, false, true, true},    // ANI and all behind it are secondary
+      {kSpareRow, false, false, false},
+  };
+  const std::vector<int32_t> formatList = FormatListRows(), choice = ChoiceRows();
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.row);
+    EXPECT_EQ(std::ranges::count(destinations, row.row), row.destination);
+    EXPECT_EQ(std::ranges::count(formatList, row.row), row.formatList);
+    EXPECT_EQ(std::ranges::count(choice, row.row), row.choice);
+  }
+  EXPECT_EQ(FormatListLine(2), "\xc3\x97\t(BMP) Windows bitmap");
+  EXPECT_EQ(FormatListLine(7), " \t(EXE) Self-displaying image");
+}
+
+TEST(DescribeFileType, WholeExtensionsOfRowsThatAreOn) {
+  EXPECT_EQ(DescribeFileType("a.bmp"), "(BMP) Windows bitmap");
+  EXPECT_EQ(DescribeFileType("a.jpeg"), "(JPEG) Jpeg");
+  EXPECT_EQ(DescribeFileType("a.jpe"), "(JPE) JPE file");  // its row is off
+  EXPECT_EQ(DescribeFileType("a.tiff"), "(TIFF) TIFF file");
+  EXPECT_EQ(DescribeFileType("x.wllppr"), "(WLLPPR) WLLPPR file");
+  EXPECT_EQ(DescribeFileType("x.clpbrd"), "(CLPBRD) CLPBRD file");
+  EXPECT_EQ(DescribeFileType("x.xyz"), "(XYZ) XYZ file");
+  EXPECT_EQ(DescribeFileType("x"), "()  file");
+}
+
+TEST(WritePicture, RefusesInOrder) {
+  const TemporaryFolder folder;
+  const struct {
+    const char* name;
+    int32_t bits;
+    Status status;
+  } rows[] = {
+      {"x.abc", 24, Status::UnsupportedFormat},      {"x.gif", 24, Status::TooManyColors}, {"x.mac", 8, Status::TooManyColors},
+      {"x.cdr", 24, Status::UnsupportedFunction},    {"x.cut", 24, Status::TooManyColors}, {"x.pcx", 24, Status::Ok},
+      {"none/x.pcx", 24, Status::ErrorCreatingFile},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    const PicturePointer picture = MakePicture(3, 2, row.bits);
+    EXPECT_EQ(WritePicture(*picture, folder.Path(row.name), {}), row.status);
+  }
+  const PicturePointer picture = MakePicture(3, 2, 24);
+  EXPECT_EQ(WritePicture(*picture, folder.Path(std::string(300, 'x') + ".pcx"), {}), Status::InvalidDestination);
+  EXPECT_FALSE(picture->image.Empty());
+  EXPECT_EQ(WritePicture(*NewPictureRecord(), folder.Path("empty.pcx"), {}), Status::EmptyImage);
+  EXPECT_THAT(folder.Names(), ElementsAre("x.pcx"));
+}
+
+TEST(WritePicture, KeepsTheSourceNameAndFlattensWhereAlphaCannotGo) {
+  const TemporaryFolder folder;
+  // Blue, green, red of 100, 150, 200 at alpha 0, 1, 128 and 255, onto a background of its own: red 10, green 20,
+  // blue 30.
+  const PicturePointer picture = MakePicture(4, 1, 24, {{100, 150, 200, 100, 150, 200, 100, 150, 200, 100, 150, 200}});
+  ASSERT_EQ(NewAlphaPlane(4, 1, picture->alpha), Status::Ok);
+  const uint8_t alphas[] = {0, 1, 128, 255};
+  std::ranges::copy(alphas, picture->alpha.Row(0).begin());
+  picture->alphaFlags = kHasAlpha | kFlattenOnBackground;
+  picture->background = 0x1e140a;
+  ASSERT_TRUE(picture->fileName.Assign("source.bmp"));
+
+  ASSERT_EQ(WritePicture(*picture, folder.Path("keeps.bmp"), {}), Status::Ok);
+  EXPECT_FALSE(picture->alpha.Empty());
+  EXPECT_EQ(picture->workName.view(), "source.bmp");
+  EXPECT_EQ(picture->fileName.view(), folder.Path("keeps.bmp"));
+
+  ASSERT_EQ(WritePicture(*picture, folder.Path("flat.pcx"), {}), Status::Ok);
+  EXPECT_TRUE(picture->alpha.Empty());
+  EXPECT_THAT(RowOf(picture->image, 0), ElementsAre(30, 20, 10, 30, 21, 11, 65, 85, 105, 100, 150, 200));
+}
+
+TEST(WritePicture, FlatteningAPalettePictureMayMakeItTooDeep) {
+  const TemporaryFolder folder;
+  std::vector<uint8_t> greys(512);
+  for (size_t i = 0; i < greys.size(); ++i) greys[i] = static_cast<uint8_t>(i);
+  for (const uint8_t alpha : {uint8_t{255}, uint8_t{100}}) {
+    SCOPED_TRACE(+alpha);
+    const PicturePointer picture = MakePicture(512, 1, 8, {greys});
+    ASSERT_EQ(NewAlphaPlane(512, 1, picture->alpha), Status::Ok);
+    for (size_t x = 0; x < 512; ++x) picture->alpha.Row(0)[x] = x < 256 ? 255 : alpha;
+    picture->alphaFlags = kHasAlpha | kFlattenOnBackground;
+    picture->background = 0x0000ff;  // greys with red in them are no greys any more: twice as many colours
+    const Status status = WritePicture(*picture, folder.Path("x.fit"), {});
+    EXPECT_EQ(status, Status::Ok);
+    EXPECT_EQ(picture->bitsPerPixel, alpha == 255 ? 8 : 24);
+    EXPECT_EQ(WritePicture(*picture, folder.Path("x.rle"), {}) == Status::TooManyColors, alpha != 255);
+  }
+}
+
+TEST(LoadPicture, NoRecordWithoutAPicture) {
+  const TemporaryFolder folder;
+  WriteText(folder.Path("x.bmp"), "BM");
+  PicturePointer picture = NewPictureRecord();
+  EXPECT_EQ(LoadPicture(folder.Path("x.abc").c_str(), picture), Status::UnsupportedFormat);
+  EXPECT_EQ(picture, nullptr);
+  EXPECT_EQ(LoadPicture(folder.Path("none.bmp").c_str(), picture), Status::FileOpenError);
+  EXPECT_EQ(LoadPicture(folder.Path("x.png").c_str(), picture) == Status::Ok, false);
+  EXPECT_NE(LoadPicture(folder.Path("x.bmp").c_str(), picture), Status::Ok);
+  EXPECT_EQ(picture, nullptr);
+  EXPECT_EQ(ReadPicture(*NewPictureRecord()), Status::UnsupportedFormat);
+}
+
+// The rows that loops and codecs rely on.
+TEST(Registry, RowsKeepTheirPromises) {
+  for (int32_t i = 0; i < formatCount; ++i) {
+    const FormatEntry& row = FormatRow(i);
+    SCOPED_TRACE(i);
+    if (i == kSpareRow) continue;
+    EXPECT_TRUE(row.info != nullptr && row.read != nullptr && row.write != nullptr);
+    EXPECT_TRUE(row.maxBits == 1 || row.maxBits == 8 || row.maxBits == 24);
+    EXPECT_EQ((row.flags & FMT_SECONDARY) != 0, i >= 41);
+    EXPECT_EQ((row.flags & FMT_MULTI) != 0, (row.flags & FMT_PAGES) != 0 || i == 0 || i == 36 || i == 41 || i == 48 || i == 49);
+    EXPECT_EQ(CanRead(row) && CanWrite(row), WhyNot(row).empty());
+  }
+}
+
+}  // namespace
+}  // namespace fotomill::test

@@ -1,0 +1,55 @@
+#include "registry/signature.h"
+
+#include <gtest/gtest.h>
+
+#include <sstream>
+
+#include "registry/registry.h"
+#include "support/files.h"
+#include "support/hex.h"
+
+namespace fotomill::test {
+namespace {
+
+TEST(Signature, KnowsFilesWhateverTheirName) {
+  const struct {
+    std::vector<uint8_t> head;
+    const char* name;
+  } rows[] = {
+      {Hex("89 50 4E 47 0D 0A 1A 0A 00 00 00 0D"), "PNG"},
+      {Hex("00 00 00 20  66 74 79 70  61 76 69 66  00 00 00 00"), "AVIF"},
+      {Hex("00 00 00 18  66 74 79 70  68 65 69 63"), "HEIC"},
+      {Hex("00 00 00 18  66 74 79 70  69 73 6F 6D"), "MP4"},  // any other brand
+      {Hex("52 49 46 46  00 00 00 00  57 45 42 50"), "WebP"},
+      {Hex("52 49 46 46  00 00 00 00  58 58 58 58"), ""},         // a container of something else
+      {Hex("49 49 2A 00 10 00 00 00 43 52 02 00"), "Canon CR2"},  // a TIFF by its first bytes
+      {Hex("49 49 2A 00 08 00 00 00"), "TIFF"},
+      {Hex("42 4D 36 10 0E 00 00 00 00 00 36 00"), "BMP"},
+      {Hex("42 4D 36 10 0E 00 01 00 00 00 36 00"), ""},  // reserved fields in use: text that begins with BM
+      {Hex("42 4D"), ""},                                // too short to tell
+      {Hex("0A 05 01 08"), "PCX"},
+      {Hex("FF 0A 00"), "JPEG XL"},
+      {{}, ""},
+      {Hex("00 00 00 00 00 00 00 00 00 00 00 00 00 00 00 00"), ""},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    const Signature signature = IdentifySignature(row.head);
+    EXPECT_EQ(signature.name, row.name);
+    std::istringstream extensions{std::string(signature.extensions)};
+    for (std::string extension; extensions >> extension;) {
+      EXPECT_NE(FindFormatByName("x." + extension), kNoFormat) << extension;
+    }
+  }
+}
+
+TEST(Signature, OfFiles) {
+  const TemporaryFolder folder;
+  WriteBytes(folder.Path("x.bin"), Hex("47 49 46 38 39 61"));
+  EXPECT_EQ(IdentifyFile(folder.Path("x.bin")).name, "GIF");
+  EXPECT_EQ(IdentifyFile(folder.Path("none")).name, "");
+  EXPECT_EQ(IdentifyFile(folder.Path()).name, "");
+}
+
+}  // namespace
+}  // namespace fotomill::test

@@ -1,0 +1,112 @@
+#include "settings/key_table.h"
+
+#include <gtest/gtest.h>
+
+#include <map>
+#include <string>
+
+#include "core/plain_name.h"
+#include "settings/settings.h"
+#include "settings/spin_range.h"
+
+namespace fotomill {
+namespace {
+
+TEST(KeyTable, TypesAreTheOnesThatPlugInsKnow) {
+  const std::map<std::string, uint32_t> types{
+      {"AllowPluginFormatOverride", 0x1},
+      {"AnnotateText", 0x2},
+      {"LogoDelay", 0x4},
+      {"AlphaBackground", 0xC},
+      {"DefaultViewMode", 0x14},
+      {"JpegCompression", 0x44},
+      {"ApplicationPath", 0x102},
+      {"VersionNumber", 0x104},
+      {"DefaultFileExtension", 0x412},
+      {"DefaultViewZoom", 0x814},
+      {"DropOptions", 0x814},
+      {"LibraryStatusFlags", 0x1002},
+      {"WatchFolders", 0x8001},
+      {"NoThumbnailImage", 0x8002},
+      {"BrowserThumbnailPrecacheDelay", 0x8044},
+      {"PrefixCrop", 0x10002},
+      {"FileTipDelay", 0x1},
+      {"FileHistoryDatabase", 0x2},
+  };
+  for (const auto& [name, type] : types) {
+    SCOPED_TRACE(name);
+    const KeyRow* const row = FindKey(name);
+    ASSERT_NE(row, nullptr);
+    EXPECT_EQ(row->type, type);
+  }
+  EXPECT_EQ(keyTable.count, Keys().size());
+}
+
+TEST(KeyTable, OrderHasItsOddPlaces) {
+  const std::pair<const char*, const char*> neighbours[] = {
+      {"AllowDestinationOverrides", "AllowPluginFormatOverride"},
+      {"AlwaysUseTHN", "AlphaBackground"},
+      {"ControlFontName", "ColourTableFile"},
+      {"LogoDelay", "MattBevelSize"},
+      {"ResourceStatusFlags", "RememberOpenWindows"},
+      {"SequentialRenameUpdate", "ShowDetailListThumbnails"},
+      {"SupercompressorSaveFilePrefix", "SWFPlayOptions"},
+      {"UseFolderOverrides", "UseAlphaChannels"},
+      {"WebPQualityFactor", "ShowWelcomeWizard"},
+      {"WriteJpegProgressive", "WriteOS2Bitmaps"},
+  };
+  for (const auto& [first, second] : neighbours) EXPECT_EQ(FindKey(first) + 1, FindKey(second)) << first;
+  EXPECT_STREQ(Keys().front().name, "AllowDestinationOverrides");
+  EXPECT_STREQ(Keys().back().name, "WriteOS2Bitmaps");
+}
+
+// Each key is reached by its name and its control alone, and its own checks accept its default.
+TEST(KeyTable, RowsAreSound) {
+  for (const KeyRow& row : Keys()) {
+    SCOPED_TRACE(row.name);
+    EXPECT_EQ(FindKey(row.name), &row);
+    EXPECT_EQ(FindKey(row.name, NumberOfKey(row) + 1), &row) << "around the end of the table";
+    EXPECT_EQ(FindKeyOfControl(row.control), row.control == 0 ? nullptr : &row);
+    EXPECT_TRUE(IsAtDefault(row));
+    if ((row.type & KEY_SPIN) != 0) {
+      const SpinRange range = SpinRangeOf(row);
+      EXPECT_LT(range.maximum, INT32_MAX) << "no range of its own";
+      EXPECT_LE(range.minimum, DefaultNumber(row));
+      EXPECT_GE(range.maximum, DefaultNumber(row));
+      EXPECT_NE(row.control, 0u);
+    }
+    EXPECT_TRUE((row.type & KEY_TEXT_LIMIT) == 0 || row.extra.textLimit == TextLimit(row));
+    EXPECT_TRUE(!HoldsName(row) || IsPlainName(DefaultText(row)));
+  }
+}
+
+TEST(KeyTable, StoredTextsStayWithinTheirLimit) {
+  const KeyRow& crop = KeyOf(KeyNumber::PrefixCrop);
+  const SettingPrefix duplicate = settings.PrefixDuplicate;  // lies behind PrefixCrop
+  StoreText(crop, std::string(100, 'x'));
+  EXPECT_EQ(TextIn(crop), std::string(32, 'x'));
+  EXPECT_EQ(settings.PrefixDuplicate.view(), duplicate.view());
+  StoreText(crop, "y");
+  EXPECT_EQ(TextIn(crop), "y");
+  StoreDefault(crop);
+  EXPECT_EQ(settings.PrefixCrop.view(), "Cropped_ ");
+}
+
+TEST(KeyTable, NearestKeyIsAlwaysNamed) {
+  const std::pair<const char*, const char*> rows[] = {
+      {"FindSimilarDistance", "FindSimlarDistance"}, {"jpegcompression", "JpegCompression"},
+      {"PngCompresion", "PngCompression"},           {"", "AllowDestinationOverrides"},
+      {"%%%", "AllowDestinationOverrides"},
+  };
+  for (const auto& [typed, nearest] : rows) EXPECT_EQ(NearestKey(typed), nearest) << typed;
+}
+
+TEST(PlainName, LeadsNowhere) {
+  for (const char* name : {"", "Cropped_ ", ".hidden", "a.b", "\xC3\xA4\xFF", "a b [1]"}) EXPECT_TRUE(IsPlainName(name)) << name;
+  using namespace std::string_view_literals;
+  for (const auto name : {"/"sv, "a/b"sv, "a\\"sv, ".."sv, "a..b"sv, "a\0b"sv, "\n"sv, "\x7F"sv})
+    EXPECT_FALSE(IsPlainName(name)) << name;
+}
+
+}  // namespace
+}  // namespace fotomill
