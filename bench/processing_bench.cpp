@@ -1,4 +1,4 @@
-// Scaling, colour reduction, turning and flattening of a picture of 6 megapixels, in source pixels per second.
+// Scaling, color reduction, turning and flattening of a picture of 6 megapixels, in source pixels per second.
 #include <benchmark/benchmark.h>
 
 #include <cmath>
@@ -13,7 +13,7 @@ namespace {
 
 constexpr int32_t kWidth = 3000, kHeight = 2000;
 
-// Waves of many colours with some noise, about as hard as a photograph.
+// Waves of many colors with some noise, about as hard as a photograph.
 PicturePointer MakePhotograph() {
   PicturePointer picture = NewPictureRecord();
   if (NewPackedImage(kWidth, kHeight, nullptr, 24, picture->image) != Status::Ok) std::abort();

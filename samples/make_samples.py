@@ -12,7 +12,7 @@ from pathlib import Path
 WIDTH, HEIGHT = 150, 112
 
 
-# The drawing: colours as (red, green, blue) from 0 to 1, x from 0 to 4/3, y from 0 (top) to 1.
+# The drawing: colors as (red, green, blue) from 0 to 1, x from 0 to 4/3, y from 0 (top) to 1.
 
 def mix(a, b, t):
     t = min(max(t, 0.0), 1.0)
@@ -20,16 +20,16 @@ def mix(a, b, t):
 
 
 def sky(x, y):
-    colour = mix((0.16, 0.30, 0.58), (0.98, 0.72, 0.45), (y / 0.66) ** 1.6)
+    color = mix((0.16, 0.30, 0.58), (0.98, 0.72, 0.45), (y / 0.66) ** 1.6)
     far = math.hypot(x - 1.02, y - 0.47)
-    colour = mix(colour, (1.0, 0.86, 0.55), 0.75 * math.exp(-(far / 0.16) ** 2))
+    color = mix(color, (1.0, 0.86, 0.55), 0.75 * math.exp(-(far / 0.16) ** 2))
     if far < 0.075:
-        colour = (1.0, 0.95, 0.76)
+        color = (1.0, 0.95, 0.76)
     for cx, cy, rx, ry in ((0.20, 0.17, 0.20, 0.030), (0.31, 0.145, 0.12, 0.035),
                            (0.93, 0.25, 0.17, 0.022), (0.85, 0.23, 0.09, 0.030)):
         inside = 1 - ((x - cx) / rx) ** 2 - ((y - cy) / ry) ** 2
-        colour = mix(colour, (1.0, 0.93, 0.88), min(inside * 1.5, 0.8))
-    return colour
+        color = mix(color, (1.0, 0.93, 0.88), min(inside * 1.5, 0.8))
+    return color
 
 
 def land(x, y):
@@ -44,8 +44,8 @@ def land(x, y):
     across = abs(row - math.floor(row) - 0.5)
     flowers = ((0.85, 0.16, 0.20), (0.96, 0.78, 0.18), (0.80, 0.25, 0.55), (0.95, 0.48, 0.16))[math.floor(row) % 4]
     grass = mix((0.40, 0.58, 0.28), (0.20, 0.42, 0.18), (y - 0.655) * 3)
-    colour = mix((0.45, 0.52, 0.38), flowers if across < 0.27 else grass, (y - 0.655) * 9)
-    return mix(colour, (0.10, 0.12, 0.08), (y - 0.80) * 0.8)
+    color = mix((0.45, 0.52, 0.38), flowers if across < 0.27 else grass, (y - 0.655) * 9)
+    return mix(color, (0.10, 0.12, 0.08), (y - 0.80) * 0.8)
 
 
 def mill(x, y):
@@ -95,10 +95,10 @@ def oval(column, row):
     return round(255 * min(max((1.0 - far) / 0.12, 0), 1))
 
 
-# Fewer colours.
+# Fewer colors.
 
 def chosen_palette(picture, count):
-    """`count` colours: boxes of pixels are halved at the median of their widest channel, the most spread box first."""
+    """`count` colors: boxes of pixels are halved at the median of their widest channel, the most spread box first."""
     def width(box, channel):
         return max(pixel[channel] for pixel in box) - min(pixel[channel] for pixel in box)
 
@@ -121,8 +121,8 @@ def indexed(picture, palette, dither):
     rows = [[list(pixel) for pixel in row] for row in picture]
     result = [[0] * WIDTH for _ in rows]
     for y, row in enumerate(rows):
-        for x, colour in enumerate(row):
-            wanted = tuple(colour)
+        for x, color in enumerate(row):
+            wanted = tuple(color)
             if wanted not in nearest:
                 nearest[wanted] = min(range(len(palette)), key=lambda i: sum((a - b) ** 2 for a, b in zip(wanted, palette[i])))
             result[y][x] = nearest[wanted]
@@ -154,7 +154,7 @@ def blue_first(row):
     return b"".join(bytes((b, g, r)) for r, g, b in row)
 
 
-def high_colour(row, green_bits):
+def high_color(row, green_bits):
     """16-bit pixels: 5 bits of red and blue with 5 or 6 of green between them."""
     green_most = 2 ** green_bits - 1
     return b"".join(struct.pack("<H", r * 31 // 255 << (5 + green_bits) | g * green_most // 255 << 5 | b * 31 // 255)
@@ -228,17 +228,17 @@ def pcx_runs(line):
 def pcx(bits, rows, palette=()):
     """`rows` holds for each row its planes as byte strings; they are made an even number of bytes long."""
     rows = [[plane + bytes(len(plane) % 2) for plane in row] for row in rows]
-    first = b"".join(bytes(colour) for colour in palette[:16]).ljust(48, b"\0")
+    first = b"".join(bytes(color) for color in palette[:16]).ljust(48, b"\0")
     header = struct.pack("<4B6H48sBBHH58x", 10, 5, 1, bits, 0, 0, WIDTH - 1, HEIGHT - 1, 72, 72, first, 0, len(rows[0]),
                          len(rows[0][0]), 1)
-    trailer = b"\x0c" + b"".join(bytes(colour) for colour in palette) if len(palette) == 256 else b""
+    trailer = b"\x0c" + b"".join(bytes(color) for color in palette) if len(palette) == 256 else b""
     return header + b"".join(pcx_runs(plane) for row in rows for plane in row) + trailer
 
 
 # FITS, X bitmap, MacPaint.
 
 def fits(rows):
-    """`rows` are bytes of grey from top to bottom."""
+    """`rows` are bytes of gray from top to bottom."""
     cards = ("SIMPLE  = T", "BITPIX  = 8", "NAXIS   = 2", f"NAXIS1  = {len(rows[0])}", f"NAXIS2  = {len(rows)}", "END")
     header = "".join(keyword.ljust(10) + value.rjust(20) + " " * 50
                      for keyword, value in ((card[:9], card[9:].strip()) for card in cards))
@@ -287,37 +287,37 @@ def main():
     folder = Path(sys.argv[1]) if len(sys.argv) > 1 else Path(__file__).resolve().parent
     picture = draw()
     black_white = [(0, 0, 0), (255, 255, 255)]
-    grey = [[(1.5 * (0.3 * r + 0.59 * g + 0.11 * b) - 80,) * 3 for r, g, b in row] for row in picture]
-    mono = indexed(grey, black_white, dither=True)
-    colours16, colours64, colours256 = (chosen_palette(picture, count) for count in (16, 64, 256))
-    picture16 = indexed(picture, colours16, dither=True)
-    picture256 = indexed(picture, colours256, dither=True)
-    flat16 = indexed(picture, colours16, dither=False)
-    flat64 = indexed(picture, colours64, dither=False)
+    gray = [[(1.5 * (0.3 * r + 0.59 * g + 0.11 * b) - 80,) * 3 for r, g, b in row] for row in picture]
+    mono = indexed(gray, black_white, dither=True)
+    colors16, colors64, colors256 = (chosen_palette(picture, count) for count in (16, 64, 256))
+    picture16 = indexed(picture, colors16, dither=True)
+    picture256 = indexed(picture, colors256, dither=True)
+    flat16 = indexed(picture, colors16, dither=False)
+    flat64 = indexed(picture, colors64, dither=False)
     with_alpha = [[(b, g, r, oval(x, y)) for x, (r, g, b) in enumerate(row)] for y, row in enumerate(picture)]
-    pcx256 = pcx(8, [[bytes(row)] for row in picture256], colours256)
+    pcx256 = pcx(8, [[bytes(row)] for row in picture256], colors256)
 
     files = {
         "bmp-mono.bmp": bmp(1, bmp_rows(mono, lambda row: packed(row, 1)), black_white),
-        "bmp-16-colours.bmp": bmp(4, bmp_rows(picture16, lambda row: packed(row, 4)), colours16),
-        "bmp-256-colours.bmp": bmp(8, bmp_rows(picture256, bytes), colours256),
-        "bmp-true-colour.bmp": bmp(24, bmp_rows(picture, blue_first)),
+        "bmp-16-colors.bmp": bmp(4, bmp_rows(picture16, lambda row: packed(row, 4)), colors16),
+        "bmp-256-colors.bmp": bmp(8, bmp_rows(picture256, bytes), colors256),
+        "bmp-true-color.bmp": bmp(24, bmp_rows(picture, blue_first)),
         "bmp-alpha.bmp": bmp(32, bmp_rows(with_alpha, lambda row: b"".join(map(bytes, row)))),
-        "bmp-rle4.bmp": bmp(4, bmp_runs(flat16, 4), colours16, compression=2),
-        "bmp-rle8.bmp": bmp(8, bmp_runs(flat64, 8), colours64 + [(0, 0, 0)] * 192, compression=1),
-        "bmp-high-colour-555.bmp": bmp(16, bmp_rows(picture, lambda row: high_colour(row, 5))),
-        "bmp-high-colour-565.bmp": bmp(16, bmp_rows(picture, lambda row: high_colour(row, 6)), compression=3,
+        "bmp-rle4.bmp": bmp(4, bmp_runs(flat16, 4), colors16, compression=2),
+        "bmp-rle8.bmp": bmp(8, bmp_runs(flat64, 8), colors64 + [(0, 0, 0)] * 192, compression=1),
+        "bmp-high-color-555.bmp": bmp(16, bmp_rows(picture, lambda row: high_color(row, 5))),
+        "bmp-high-color-565.bmp": bmp(16, bmp_rows(picture, lambda row: high_color(row, 6)), compression=3,
                                    masks=struct.pack("<III", 0xF800, 0x07E0, 0x001F)),
-        "bmp-os2.bmp": os2_bmp(8, bmp_rows(picture256, bytes), colours256),
-        "bmp-top-down.bmp": bmp(8, bmp_rows(picture256[::-1], bytes), colours256, height=-HEIGHT),
+        "bmp-os2.bmp": os2_bmp(8, bmp_rows(picture256, bytes), colors256),
+        "bmp-top-down.bmp": bmp(8, bmp_rows(picture256[::-1], bytes), colors256, height=-HEIGHT),
         "pcx-mono.pcx": pcx(1, [[packed(row, 1)] for row in mono], black_white),
-        "pcx-16-colours.pcx": pcx(1, [[packed([index >> plane & 1 for index in row], 1) for plane in range(4)]
-                                  for row in picture16], colours16),
-        "pcx-16-colours-packed.pcx": pcx(4, [[packed(row, 4)] for row in picture16], colours16),
-        "pcx-256-colours.pcx": pcx256,
-        "pcx-true-colour.pcx": pcx(8, [[bytes(pixel[channel] for pixel in row) for channel in range(3)] for row in picture]),
+        "pcx-16-colors.pcx": pcx(1, [[packed([index >> plane & 1 for index in row], 1) for plane in range(4)]
+                                  for row in picture16], colors16),
+        "pcx-16-colors-packed.pcx": pcx(4, [[packed(row, 4)] for row in picture16], colors16),
+        "pcx-256-colors.pcx": pcx256,
+        "pcx-true-color.pcx": pcx(8, [[bytes(pixel[channel] for pixel in row) for channel in range(3)] for row in picture]),
         "damaged.pcx": pcx256[:len(pcx256) // 2],
-        "fits-grey.fits": fits([bytes((30 * r + 59 * g + 11 * b) // 100 for r, g, b in row) for row in picture]),
+        "fits-gray.fits": fits([bytes((30 * r + 59 * g + 11 * b) // 100 for r, g, b in row) for row in picture]),
         "xbm-mono.xbm": xbm([row[3:147] for row in mono], "windmill"),
         "mac-mono.mac": mac_paint(mono, "Windmill"),
     }

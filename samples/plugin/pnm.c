@@ -3,8 +3,8 @@
  *
  * A file is a text header followed by samples, top row first:
  *
- *   "P1" plain bitmap  "P2" plain greymap  "P3" plain pixmap
- *   "P4" raw bitmap    "P5" raw greymap    "P6" raw pixmap
+ *   "P1" plain bitmap  "P2" plain graymap  "P3" plain pixmap
+ *   "P4" raw bitmap    "P5" raw graymap    "P6" raw pixmap
  *   width and height, then (not for bitmaps) the largest sample value, all in decimal, separated by white space;
  *   "#" starts a comment that ends with its line; one white-space character stands before raw samples.
  *
@@ -138,7 +138,7 @@ static void PutLe(uint8_t* bytes, uint32_t value, int count) {
   for (i = 0; i < count; ++i) bytes[i] = (uint8_t)(value >> (8 * i));
 }
 
-/* A zeroed packed bitmap with its header and grey colour table; `rows` receives where the rows begin. */
+/* A zeroed packed bitmap with its header and gray color table; `rows` receives where the rows begin. */
 static uint8_t* NewBitmap(uint32_t width, uint32_t height, int bits, uint8_t** rows) {
   const uint32_t colors = bits == 24 ? 0 : 1u << bits;
   const size_t rowBytes = Stride(width, bits) * height;
@@ -184,7 +184,7 @@ static void WriteComment(FILE* file, const char* comment) {
   if (!lineStart) putc('\n', file);
 }
 
-/* The kind of file that an extension asks for: 4 bitmap, 5 greymap, 6 pixmap; "pnm" takes what fits the depth. */
+/* The kind of file that an extension asks for: 4 bitmap, 5 graymap, 6 pixmap; "pnm" takes what fits the depth. */
 static int KindFor(const char* fileName, int bits) {
   const char* dot = strrchr(fileName, '.');
   const char middle = dot != NULL && dot[1] != 0 ? (char)(dot[2] | 0x20) : 'n';
@@ -194,7 +194,7 @@ static int KindFor(const char* fileName, int bits) {
   return bits == 1 ? 4 : bits == 24 ? 6 : 5;
 }
 
-/* The colour of column x as blue, green, red. */
+/* The color of column x as blue, green, red. */
 static const uint8_t* ColorAt(const uint8_t* row, const uint8_t* table, int bits, uint32_t x) {
   if (bits == 24) return row + 3 * (size_t)x;
   if (bits == 8) return table + 4 * row[x];
@@ -202,7 +202,7 @@ static const uint8_t* ColorAt(const uint8_t* row, const uint8_t* table, int bits
   return table + 4 * (row[x / 8] >> (7 - x % 8) & 1);
 }
 
-static int GreyOf(const uint8_t* color) { return (color[2] * 299 + color[1] * 587 + color[0] * 114 + 500) / 1000; }
+static int GrayOf(const uint8_t* color) { return (color[2] * 299 + color[1] * 587 + color[0] * 114 + 500) / 1000; }
 
 static void WriteRow(FILE* file, const uint8_t* row, const uint8_t* table, int bits, int kind, uint32_t width) {
   uint8_t packed = 0;
@@ -214,9 +214,9 @@ static void WriteRow(FILE* file, const uint8_t* row, const uint8_t* table, int b
       putc(color[1], file);
       putc(color[0], file);
     } else if (kind == 5) {
-      putc(GreyOf(color), file);
+      putc(GrayOf(color), file);
     } else {
-      if (GreyOf(color) < 128) packed |= (uint8_t)(0x80 >> x % 8);
+      if (GrayOf(color) < 128) packed |= (uint8_t)(0x80 >> x % 8);
       if (x % 8 == 7 || x + 1 == width) {
         putc(packed, file);
         packed = 0;
@@ -243,7 +243,7 @@ FMW_EXPORT int32_t FMW_CALL PLUGIN11GetPluginParams(FMW_PLUGIN_PARAMS* params, i
 
 FMW_EXPORT int32_t FMW_CALL PLUGIN11GetInfo(FMW_PICTURE_INFO* info, const char* fileName, int32_t* error,
                                             const FMW_HOST_SERVICES* services) {
-  static const char* const names[] = {"Portable bitmap", "Portable greymap", "Portable pixmap"};
+  static const char* const names[] = {"Portable bitmap", "Portable graymap", "Portable pixmap"};
   FILE* file;
   Header header;
   int i;

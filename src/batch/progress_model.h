@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "core/status.h"
+#include "picture/rectangle.h"
 
 namespace fotomill {
 
@@ -70,12 +71,6 @@ class ProgressModel {
 inline constexpr std::string_view kErrorsLine = "There were errors";
 // "No files were processed.", "One file was processed." or "7 files were processed."
 std::string CountLine(uint32_t files);
-
-// Pixels.
-struct Rectangle {
-  int32_t x = 0, y = 0, width = 0, height = 0;
-  bool operator==(const Rectangle&) const = default;
-};
 
 // Place and size of the box in its frame's client area.
 Rectangle ProgressBoxPlace(int32_t frameWidth, int32_t frameHeight, const ProgressSettings& box);

@@ -248,7 +248,7 @@ class Batch {
     return names_.MakeVariant(path, job_.naming.firstVariant, job_.naming.lastVariant, taken);
   }
 
-  // Codecs may take less than their row says; colours are then reduced further, step by step.
+  // Codecs may take less than their row says; colors are then reduced further, step by step.
   Status Write(PictureRecord& picture, const Destination& destination) const {
     const bool there = job_.naming.beside || job_.destinationFolder.empty() || !function_.out.empty() || destination.elsewhere;
     if (!there && !platform::MakeFolders(FolderOf(destination.path))) return Status::ErrorCreatingFile;

@@ -27,10 +27,10 @@ struct BatchFunction {
   std::string out = {};                          // not empty: the whole path of the output of a selection of one
   int32_t page = 1;                              // of files with several, from 1
   uint32_t jobs = 0;                             // pictures in work at a time; 0: one a core
-  bool reduce = false;                           // colours of pictures that are too deep for the format are reduced
+  bool reduce = false;                           // colors of pictures that are too deep for the format are reduced
   std::string reduceHint = {};                   // goes behind "Too many colors." where they are not
   bool autoOrient = false;                       // pictures are turned upright as their EXIF says
-  bool keepMetadata = true;                      // EXIF, XMP and colour profiles go along
+  bool keepMetadata = true;                      // EXIF, XMP and color profiles go along
   bool keepTimes = false;                        // outputs get the times of their sources
   bool keepTree = false;                         // folders of the selection are made again in the destination folder
   bool dryRun = false;                           // nothing is written; outcomes are those of a run, as far as they can be told

@@ -50,7 +50,7 @@ CHOICES(kMonoDitherChoices,
     CHOICE("Floyd-Steinberg (most faithful)", kDitherFloydSteinberg));
 CHOICES(kMonoModeChoices,
     CHOICE("Black and white", kMonoBlackWhite),
-    CHOICE("Shades of gray",  kMonoGrey));
+    CHOICE("Shades of gray",  kMonoGray));
 CHOICES(kExtensionCaseChoices,
     CHOICE("As in the source file's name", kCaseOfSource),
     CHOICE("Upper case",                   kCaseUpper),
@@ -116,7 +116,7 @@ CHOICES(kSizeModeChoices,
     CHOICE("Kilobytes",         kSizeKilobytes),
     CHOICE("Most fitting unit", kSizeFitting));
 CHOICES(kFrameBackgroundChoices,
-    CHOICE("Color",   kFrameColour),
+    CHOICE("Color",   kFrameColor),
     CHOICE("Picture", kFramePicture));
 
 #undef CHOICE

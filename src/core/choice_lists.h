@@ -8,7 +8,7 @@ namespace fotomill {
 // taken as the nearest one of the list.
 namespace choice {
 
-// JpegSubsample: how many pixels share one pair of colour values.
+// JpegSubsample: how many pixels share one pair of color values.
 enum JpegSubsampling : int32_t { kSubsample444 = 0, kSubsample422 = 1, kSubsample420 = 2 };
 // JpegProcessor. The default, 2, lies beyond the list and therefore means the last entry.
 enum JpegEngine : int32_t { kJpegStandard = 0, kJpegFastest = 1 };
@@ -29,13 +29,13 @@ enum MovieCodec : int32_t { kMovieJpeg = 0, kMoviePng = 1 };
 enum PhotoCdSize : int32_t { kPhotoCd192 = 0, kPhotoCd384 = 1, kPhotoCd768 = 2, kPhotoCd1536 = 3, kPhotoCd3072 = 4 };
 // ResizeFilter, ThumbnailZoomFilter: how pixels are computed when a picture changes its size.
 enum ResampleFilter : int32_t { kBicubic = 0, kLanczos = 1, kBilinear = 2, kNearest = 3 };
-// FXColorDither, FXMonoDither: how colours that a palette lacks are imitated. Without dithering each pixel becomes the
-// nearest colour; of black and white, the one on its side of FXThreshold (0: of the limit that parts the picture best).
+// FXColorDither, FXMonoDither: how colors that a palette lacks are imitated. Without dithering each pixel becomes the
+// nearest color; of black and white, the one on its side of FXThreshold (0: of the limit that parts the picture best).
 // FXBidirectional makes error diffusion turn at the end of every row.
 enum Dithering : int32_t { kDitherNone = 0, kDitherOrdered = 1, kDitherFloydSteinberg = 2 };
-// FXMonomode: what colour pictures become, black and white or FXGrayLevel shades of grey (0: all that the depth
+// FXMonomode: what color pictures become, black and white or FXGrayLevel shades of gray (0: all that the depth
 // has).
-enum MonoMode : int32_t { kMonoBlackWhite = 0, kMonoGrey = 1 };
+enum MonoMode : int32_t { kMonoBlackWhite = 0, kMonoGray = 1 };
 // ExtensionCaseStyle: letter case of written extensions.
 enum ExtensionCase : int32_t { kCaseOfSource = 0, kCaseUpper = 1, kCaseLower = 2 };
 // DefaultThumbnailMode and a folder's ThumbnailMode: where thumbnails live.
@@ -78,7 +78,7 @@ enum LengthUnit : int32_t { kInches = 0, kCentimetres = 1, kPixels = 2 };
 // DetailSizeMode: how file sizes are shown.
 enum SizeMode : int32_t { kSizeBytes = 0, kSizeKilobytes = 1, kSizeFitting = 2 };
 // MDIClientBackground: MDIClientColor or MDIClientImage fills the frame.
-enum FrameBackground : int32_t { kFrameColour = 0, kFramePicture = 1 };
+enum FrameBackground : int32_t { kFrameColor = 0, kFramePicture = 1 };
 
 }  // namespace choice
 

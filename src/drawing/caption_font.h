@@ -5,10 +5,10 @@
 #include <string>
 #include <string_view>
 
-#include "batch/progress_model.h"
 #include "core/status.h"
 #include "picture/packed_image.h"
 #include "picture/picture_record.h"
+#include "picture/rectangle.h"
 
 namespace fotomill {
 

@@ -15,7 +15,7 @@ constexpr int32_t kPictureInset = 2;                     // from a cell's corner
 constexpr int32_t kFrameReach = 3;                       // the far lines lie this far behind the room's size
 constexpr int32_t kCaptionTop = 3, kCaptionBottom = 18;  // below the room
 constexpr int32_t kPageMargin = 12;                      // around the grid of a page without a size of its own
-constexpr Color kWhite = 0xFFFFFF, kBlack = 0, kDarkGrey = 0x404040, kGrey = 0xA0A0A0;
+constexpr Color kWhite = 0xFFFFFF, kBlack = 0, kDarkGray = 0x404040, kGray = 0xA0A0A0;
 
 void FillPixels(PackedImage& page, Rectangle area, Color color) {
   const int32_t left = std::max(area.x, 0), right = std::min(area.x + area.width, page.Width());
@@ -33,8 +33,8 @@ void FillPixels(PackedImage& page, Rectangle area, Color color) {
 void DrawFrame(const CatalogueLook& look, const Rectangle& cell, PackedImage& page) {
   if (look.frame == CellFrame::None) return;
   const bool raised = look.frame == CellFrame::Raised;
-  const Color flat = look.blackText ? kBlack : kGrey;
-  const Color light = raised ? kWhite : flat, dark = raised ? kDarkGrey : flat;
+  const Color flat = look.blackText ? kBlack : kGray;
+  const Color light = raised ? kWhite : flat, dark = raised ? kDarkGray : flat;
   const int32_t right = cell.x + cell.width + kFrameReach, bottom = cell.y + cell.height + kFrameReach;
   const int32_t width = right - cell.x + 1, height = bottom - cell.y + 1;
   FillPixels(page, {cell.x, cell.y, width, 1}, light);

@@ -3,23 +3,23 @@
 #include <cstdint>
 #include <string_view>
 
-#include "batch/progress_model.h"
 #include "core/status.h"
 #include "drawing/caption_font.h"
 #include "picture/packed_image.h"
 #include "picture/picture_record.h"
+#include "picture/rectangle.h"
 
 namespace fotomill {
 
 enum class CellFrame { None, Raised, Flat };
 
-// How catalogue pages look. Colour values are 0x00BBGGRR.
+// How catalogue pages look. Color values are 0x00BBGGRR.
 struct CatalogueLook {
   int32_t columns = 5, rows = 4;
   int32_t cellWidth = 96, cellHeight = 96;  // the room of a picture
   int32_t pageWidth = 0, pageHeight = 0;    // 0: as large as the grid needs
   CellFrame frame = CellFrame::Raised;
-  bool blackText = false;  // names and flat frames are black, not white and grey
+  bool blackText = false;  // names and flat frames are black, not white and gray
   bool names = true;
   Color background = 0x606060;
 };

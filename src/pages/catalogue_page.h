@@ -17,7 +17,7 @@ inline constexpr uint32_t kLastCataloguePage = 10000000;
 std::string CataloguePageName(std::string_view prefix, uint32_t number, std::string_view extension);
 
 struct CataloguePageOptions {
-  bool reduce = false;  // the page's colours are reduced where the format takes fewer
+  bool reduce = false;  // the page's colors are reduced where the format takes fewer
   bool dryRun = false;
 };
 

@@ -73,7 +73,7 @@ Status NewPackedImage(int32_t width, int32_t height, const Palette* palette, int
 }
 
 Status NewAlphaPlane(int32_t width, int32_t height, PackedImage& plane, platform::Fill fill) {
-  const Palette ramp = GreyRamp();
+  const Palette ramp = GrayRamp();
   return NewPackedImage(width, height, &ramp, 8, plane, fill);
 }
 

@@ -33,8 +33,8 @@ constexpr uint64_t RowStride(int32_t width, int32_t bits) {
 //       16    4            compression, 0
 //       20    4            bytes of all rows
 //       24    8            two resolutions, 0
-//       32    8            colours used and important: 2, 16, 256, or 0 for 24 bits
-//       40    4 x colours  blue, green, red, 0
+//       32    8            colors used and important: 2, 16, 256, or 0 for 24 bits
+//       40    4 x colors  blue, green, red, 0
 //        .    rows         each padded to a multiple of 4 bytes; 24-bit pixels are blue, green, red
 //
 // Pixels of less than 8 bits lie in a byte from the most significant bit down. The holder owns the block.
@@ -61,7 +61,7 @@ class PackedImage {
   std::span<const uint8_t> Rows() const { return block_.Bytes().subspan(RowsOffset()); }
   // The whole block, as laid out above.
   std::span<const uint8_t> Bytes() const { return block_.Bytes(); }
-  // The colour table: Colors() entries of blue, green, red, 0.
+  // The color table: Colors() entries of blue, green, red, 0.
   std::span<uint8_t> ColorTable() { return block_.Bytes().subspan(kHeaderSize, RowsOffset() - kHeaderSize); }
   std::span<const uint8_t> ColorTable() const { return block_.Bytes().subspan(kHeaderSize, RowsOffset() - kHeaderSize); }
 
@@ -81,14 +81,14 @@ class PackedImage {
 // 1, MemoryAllocationError when its block would exceed the limit.
 Status CheckPackedSize(int32_t width, int32_t height, int32_t bitsPerPixel);
 
-// Makes the packed block of a picture at the normalised depth of `bitsPerPixel`, with its colour table taken from
+// Makes the packed block of a picture at the normalised depth of `bitsPerPixel`, with its color table taken from
 // `palette` (zero without one) and its rows zero; with Fill::Unset the rows hold anything, for callers that write every
 // byte of them, padding included. DamagedFile when width or height is below 1, MemoryAllocationError when the block would
 // exceed the limit or cannot be had; `image` is empty then.
 Status NewPackedImage(int32_t width, int32_t height, const Palette* palette, int32_t bitsPerPixel, PackedImage& image,
                       platform::Fill fill = platform::Fill::Zero);
 
-// An 8-bit image of the same size as a picture, with the grey ramp as its palette: the form of an alpha plane, whose
+// An 8-bit image of the same size as a picture, with the gray ramp as its palette: the form of an alpha plane, whose
 // values run from 0, transparent, to 255. Statuses as NewPackedImage.
 Status NewAlphaPlane(int32_t width, int32_t height, PackedImage& plane, platform::Fill fill = platform::Fill::Zero);
 

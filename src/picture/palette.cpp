@@ -11,23 +11,23 @@ struct Rgb {
   uint8_t red, green, blue;
 };
 
-// Appends colours to a palette, or only counts them when there is none.
+// Appends colors to a palette, or only counts them when there is none.
 class PaletteFiller {
  public:
   explicit PaletteFiller(Palette* palette) : palette_(palette) {
     if (palette_ != nullptr) palette_->fill(0);
   }
-  void Add(Rgb colour) {
+  void Add(Rgb color) {
     if (palette_ != nullptr) {
       uint8_t* entry = palette_->data() + 3 * count_;
-      entry[0] = colour.red;
-      entry[1] = colour.green;
-      entry[2] = colour.blue;
+      entry[0] = color.red;
+      entry[1] = color.green;
+      entry[2] = color.blue;
     }
     ++count_;
   }
-  void AddAll(std::span<const Rgb> colours) {
-    for (const Rgb& colour : colours) Add(colour);
+  void AddAll(std::span<const Rgb> colors) {
+    for (const Rgb& color : colors) Add(color);
   }
   // Every combination of the levels; the first channel changes slowest.
   void AddCube(std::span<const uint8_t> reds, std::span<const uint8_t> greens, std::span<const uint8_t> blues) {
@@ -58,8 +58,8 @@ constexpr Rgb kVga[] = {{0, 0, 0},       {0x80, 0, 0},       {0, 0x80, 0},      
                         {0, 0x80, 0x80}, {0x80, 0x80, 0x80}, {0xc0, 0xc0, 0xc0}, {255, 0, 0},     {0, 255, 0},  {255, 255, 0},
                         {0, 0, 255},     {255, 0, 255},      {0, 255, 255},      {255, 255, 255}};
 
-// `count` greys between black and white, neither of which is among them.
-void AddInnerGreys(PaletteFiller& filler, int32_t count) {
+// `count` grays between black and white, neither of which is among them.
+void AddInnerGrays(PaletteFiller& filler, int32_t count) {
   for (int32_t i = 1; i <= count; ++i) {
     const auto level = static_cast<uint8_t>((i * 255 + (count + 1) / 2) / (count + 1));
     filler.Add({level, level, level});
@@ -100,11 +100,11 @@ int32_t MakeDefaultPalette(Palette* palette, int32_t* depth, int32_t kind) {
     case 6: filler.AddCube(kSixSteps, kSixSteps, kSixSteps); break;
     case 8:
       filler.AddCube(kSixSteps, kSixSteps, kSixSteps);
-      AddInnerGreys(filler, 40);
+      AddInnerGrays(filler, 40);
       break;
     case 9:
       filler.AddCube(kSevenSteps, kTwelveSteps, kThreeSteps);
-      AddInnerGreys(filler, 4);
+      AddInnerGrays(filler, 4);
       break;
     default: filler.AddCube(kEightSteps, kEightSteps, kFourSteps); break;
   }
@@ -112,7 +112,7 @@ int32_t MakeDefaultPalette(Palette* palette, int32_t* depth, int32_t kind) {
   return filler.Count();
 }
 
-Palette GreyRamp() {
+Palette GrayRamp() {
   Palette ramp;
   for (size_t i = 0; i < ramp.size(); ++i) ramp[i] = static_cast<uint8_t>(i / 3);
   return ramp;

@@ -15,7 +15,7 @@
 
 namespace fotomill {
 
-// Colour values are 0x00BBGGRR.
+// Color values are 0x00BBGGRR.
 using Color = uint32_t;
 
 // Bits of PictureRecord::alphaFlags.
@@ -74,7 +74,7 @@ struct PictureRecord {
   PackedImage image;                 // empty until `read` succeeds
   int32_t formatIndex = -1;          // row of the registry, -1 none
   void* context = nullptr;           // the job that asked for the picture; not owned
-  std::array<uint8_t, 256> remap{};  // colour translation, the identity at first
+  std::array<uint8_t, 256> remap{};  // color translation, the identity at first
   DetailLines detailLines;
   platform::MemoryBlock auxBlock;
   platform::MemoryBlock extraBlock2;

@@ -84,7 +84,7 @@ typedef struct FMW_PLUGIN_PARAMS {
 typedef struct FMW_CONFIG_ENTRY {
   const char* name;     /* the key's name */
   const void* variable; /* where its value is: an int32_t, or a text of at least 33 bytes; read only */
-  uint32_t type;        /* 0x1 flag, 0x2 text, 0x4 integer, 0x8 colour ... */
+  uint32_t type;        /* 0x1 flag, 0x2 text, 0x4 integer, 0x8 color ... */
   uint32_t control;
   const void* extra;
 } FMW_CONFIG_ENTRY;
@@ -123,10 +123,10 @@ typedef struct FMW_PICTURE_INFO {
   int32_t dpiX;          /*  40: pixels per inch, 0 unknown */
   int32_t dpiY;          /*  44 */
   int32_t imageBytes;    /*  48: size of the pixel data, 0 to have it computed */
-  uint8_t palette[768];  /*  52: 256 colours, red, green, blue */
-  int32_t background;    /* 820: colour behind a transparent picture, 0x00BBGGRR */
+  uint8_t palette[768];  /*  52: 256 colors, red, green, blue */
+  int32_t background;    /* 820: color behind a transparent picture, 0x00BBGGRR */
   uint8_t reserved5[60]; /* 824 */
-  char typeName[65];     /* 884: the variant's name, "Portable greymap" */
+  char typeName[65];     /* 884: the variant's name, "Portable graymap" */
 } FMW_PICTURE_INFO;
 
 /* Handed to PLUGIN11DoConfigure. */
@@ -140,7 +140,7 @@ typedef struct FMW_CONFIGURE {
 
 /*
  * A packed bitmap, as ReadImage returns and WriteImage receives it: a 40-byte BITMAPINFOHEADER (width, positive height,
- * 1 plane, 1, 4, 8, 24 or, from plug-ins, 32 bits, no compression), the colour table of 2, 16 or 256 entries of blue,
+ * 1 plane, 1, 4, 8, 24 or, from plug-ins, 32 bits, no compression), the color table of 2, 16 or 256 entries of blue,
  * green, red, 0 for up to 8 bits, and the rows, bottom row first, each padded to a multiple of 4 bytes. 24-bit pixels
  * are blue, green, red; 32-bit ones have an alpha byte behind them, 0 transparent.
  */

@@ -18,7 +18,7 @@ struct BitmapHeader {
   bool topDown = false;
   uint16_t bits = 0;
   uint32_t compression = 0;
-  uint32_t colors = 0;  // entries of the colour table
+  uint32_t colors = 0;  // entries of the color table
 };
 
 Status ParseHeader(ByteReader& bytes, BitmapHeader& header) {

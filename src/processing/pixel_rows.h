@@ -8,7 +8,7 @@ namespace fotomill {
 // Rows of pixels taken apart and put together, as codecs need it between a file's order and that of a packed image.
 // `count` is in pixels, rows do not overlap, and no byte beyond `count` pixels is read or written.
 
-// Pixels of blue, green, red into one plane for each colour, and back.
+// Pixels of blue, green, red into one plane for each color, and back.
 void SplitColors(const uint8_t* bgr, size_t count, uint8_t* blue, uint8_t* green, uint8_t* red);
 void MergeColors(const uint8_t* blue, const uint8_t* green, const uint8_t* red, size_t count, uint8_t* bgr);
 

@@ -30,7 +30,7 @@ class BgrRows {
   platform::MemoryBlock row_;
 };
 
-// Makes a copy of `image` at a greater depth: 4, 8 or 24 bits. A deeper palette image keeps its indices and the colours of
+// Makes a copy of `image` at a greater depth: 4, 8 or 24 bits. A deeper palette image keeps its indices and the colors of
 // the shallower one at the front of its table, the rest black. UnsuitableImage when `bits` is not above the image's depth,
 // else as NewPackedImage.
 Status PromoteImage(const PackedImage& image, int32_t bits, PackedImage& promoted);
@@ -43,23 +43,23 @@ Status PromotePicture(PictureRecord& picture, int32_t bits = 24);
 // picture may have been promoted but is whole.
 Status PromoteToAlpha(PictureRecord& picture);
 
-// The distinct colours of an image, up to a number, with the index of each.
+// The distinct colors of an image, up to a number, with the index of each.
 class ColorSet {
  public:
   static constexpr int32_t kMost = 256;
 
   ColorSet() { slots_.fill(kFree); }
-  // Takes in the pixels of a row, blue, green, red. False, at once, when there are more than `most` colours.
+  // Takes in the pixels of a row, blue, green, red. False, at once, when there are more than `most` colors.
   bool AddRow(const uint8_t* bgr, int32_t width, int32_t most = kMost);
   int32_t Count() const { return count_; }
-  // Puts the colours into order of brightness, numbers them, and writes them to `palette`, black behind the last.
+  // Puts the colors into order of brightness, numbers them, and writes them to `palette`, black behind the last.
   void Number(Palette& palette);
-  // The number of a colour, 0x00RRGGBB, that is in the set.
+  // The number of a color, 0x00RRGGBB, that is in the set.
   uint8_t IndexOf(uint32_t color) const { return indices_[SlotOf(color)]; }
 
  private:
   static constexpr uint32_t kFree = 0xffffffff;
-  static constexpr uint32_t kSlots = 1024;  // four a colour, so that a search ends soon
+  static constexpr uint32_t kSlots = 1024;  // four a color, so that a search ends soon
   uint32_t SlotOf(uint32_t color) const {
     uint32_t slot = (color * 0x9e3779b1u) >> 22;
     while (slots_[slot] != color && slots_[slot] != kFree) slot = (slot + 1) % kSlots;
@@ -71,9 +71,9 @@ class ColorSet {
   int32_t count_ = 0;
 };
 
-// Replaces the picture's image by the shallowest palette image (1, 4 or 8 bits, at most `maxBits`) that holds the colours
+// Replaces the picture's image by the shallowest palette image (1, 4 or 8 bits, at most `maxBits`) that holds the colors
 // that it uses, exactly, and sets palette and `bitsPerPixel`; the palette is in order of brightness. `packed` tells
-// whether that was done: not when there are too many colours, nor when the image is as shallow already. The alpha plane
+// whether that was done: not when there are too many colors, nor when the image is as shallow already. The alpha plane
 // stays. MemoryAllocationError leaves the picture unchanged.
 Status PackFewColors(PictureRecord& picture, int32_t maxBits, bool& packed);
 

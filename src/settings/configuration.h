@@ -14,7 +14,7 @@
 namespace fotomill {
 
 // The configuration file "Fotomill Professional 11.ini" in the data folder: its section "Fotomill" holds one line "KEY=VALUE"
-// for each key that differs from its default. Numbers, flags, colours and choices are decimal, texts stand as they are.
+// for each key that differs from its default. Numbers, flags, colors and choices are decimal, texts stand as they are.
 // All of this belongs to the main thread.
 
 inline constexpr std::string_view kConfigurationFile = "Fotomill Professional 11.ini";

@@ -19,7 +19,7 @@ enum class Kind : uint8_t {
   Integer,
   Spin,
   SetupSpin,
-  Colour,
+  Color,
   Choice,
   ValueChoice,
   InternalInteger,
@@ -40,7 +40,7 @@ constexpr uint32_t TypeOf(Kind kind) {
     case Kind::Integer: return KEY_INTEGER;
     case Kind::Spin: return KEY_INTEGER | KEY_SPIN;
     case Kind::SetupSpin: return KEY_INTEGER | KEY_SPIN | KEY_SETUP;
-    case Kind::Colour: return KEY_INTEGER | KEY_COLOUR;
+    case Kind::Color: return KEY_INTEGER | KEY_COLOR;
     case Kind::Choice: return KEY_INTEGER | KEY_CHOICE;
     case Kind::ValueChoice: return KEY_INTEGER | KEY_CHOICE | KEY_BY_VALUE;
     case Kind::InternalInteger: return KEY_INTEGER | KEY_INTERNAL;

@@ -14,7 +14,7 @@ enum KeyType : uint32_t {
   KEY_FLAG = 0x1,            // 0 or 1, a check box
   KEY_TEXT = 0x2,            // a zero-terminated text of at most 260 characters
   KEY_INTEGER = 0x4,         // an integer in an edit field
-  KEY_COLOUR = 0x8,          // 0x00BBGGRR; the control carries the colour
+  KEY_COLOR = 0x8,          // 0x00BBGGRR; the control carries the color
   KEY_CHOICE = 0x10,         // a combo or list box
   KEY_FILLED_TEXT = 0x20,    // a text whose control is filled by the dialog itself
   KEY_SPIN = 0x40,           // an integer with a range, "minimum,maximum,step" in the text of control + 10000

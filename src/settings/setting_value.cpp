@@ -11,7 +11,7 @@ namespace fotomill {
 
 namespace {
 
-constexpr int32_t kMostColour = 0xFFFFFF;
+constexpr int32_t kMostColor = 0xFFFFFF;
 
 // Decimal, or "0x" and hexadecimal digits where a person writes.
 std::optional<int32_t> ReadNumber(std::string_view value, ValueSource source) {
@@ -35,7 +35,7 @@ bool IsInList(const KeyRow& row, int32_t number) {
 
 ValueFault NumberFault(const KeyRow& row, int32_t number) {
   if ((row.type & KEY_FLAG) != 0) return IsLooseFlag(row) || number == 0 || number == 1 ? ValueFault::None : ValueFault::NotFlag;
-  if ((row.type & KEY_COLOUR) != 0) return number >= 0 && number <= kMostColour ? ValueFault::None : ValueFault::NotColour;
+  if ((row.type & KEY_COLOR) != 0) return number >= 0 && number <= kMostColor ? ValueFault::None : ValueFault::NotColor;
   if ((row.type & KEY_CHOICE) != 0) return IsInList(row, number) ? ValueFault::None : ValueFault::NotChoice;
   if ((row.type & KEY_SPIN) != 0) {
     const SpinRange range = SpinRangeOf(row);
@@ -54,7 +54,7 @@ SettingValue ReadNumberValue(const KeyRow& row, std::string_view text, ValueSour
   }
   value.number = *number;
   value.fault = NumberFault(row, *number);
-  value.usable = value.fault == ValueFault::None || (source == ValueSource::File && value.fault != ValueFault::NotColour);
+  value.usable = value.fault == ValueFault::None || (source == ValueSource::File && value.fault != ValueFault::NotColor);
   if (value.fault == ValueFault::NotFlag) value.number = 1;
   return value;
 }
@@ -134,7 +134,7 @@ std::string FaultMessage(const KeyRow& row, ValueFault fault) {
     case ValueFault::None: return {};
     case ValueFault::NotNumber: return takes + "a whole number.";
     case ValueFault::NotFlag: return takes + (IsLooseFlag(row) ? "a whole number." : "0 or 1.");
-    case ValueFault::NotColour: return takes + "a color: blue * 65536 + green * 256 + red, or 0xBBGGRR.";
+    case ValueFault::NotColor: return takes + "a color: blue * 65536 + green * 256 + red, or 0xBBGGRR.";
     case ValueFault::NotChoice: return takes + ListText(row) + ".";
     case ValueFault::OutOfRange: {
       const SpinRange range = SpinRangeOf(row);

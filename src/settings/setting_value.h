@@ -13,7 +13,7 @@ enum class ValueFault {
   None,
   NotNumber,   // not a whole number of 32 bits
   NotFlag,     // neither 0 nor 1
-  NotColour,   // not a number of 24 bits
+  NotColor,   // not a number of 24 bits
   NotChoice,   // not in the choice list
   OutOfRange,  // outside the spin control's range
   TooLong,     // longer than the key's limit

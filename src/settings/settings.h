@@ -6,7 +6,7 @@
 
 namespace fotomill {
 
-// The variable type of each kind of key in settings.def. Colours are 0x00BBGGRR. What the numbers of a choice mean is in
+// The variable type of each kind of key in settings.def. Colors are 0x00BBGGRR. What the numbers of a choice mean is in
 // choice_lists.h.
 using SettingFlag = int32_t;       // 0 or 1
 using SettingLooseFlag = int32_t;  // a flag whose number is kept as it is
@@ -14,7 +14,7 @@ using SettingSetupFlag = int32_t;  // a flag that windows must follow at once
 using SettingInteger = int32_t;
 using SettingSpin = int32_t;  // an integer with a range in its Setup dialog
 using SettingSetupSpin = int32_t;
-using SettingColour = int32_t;
+using SettingColor = int32_t;
 using SettingChoice = int32_t;       // position in the choice list
 using SettingValueChoice = int32_t;  // value of the list's entry
 using SettingInternalInteger = int32_t;

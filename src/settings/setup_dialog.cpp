@@ -71,7 +71,7 @@ void FillControl(SetupDialog& dialog, const DestinationSource& destinations, con
   } else if ((row.type & KEY_CHOICE) != 0) {
     dialog.SetChoices(row.control, ChoiceTexts(row));
     dialog.Select(row.control, PositionOf(row, NumberOf(row, values)));
-  } else if ((row.type & KEY_COLOUR) != 0) {
+  } else if ((row.type & KEY_COLOR) != 0) {
     dialog.SetColour(row.control, NumberOf(row, values));
   } else {
     if ((row.type & KEY_SPIN) != 0) dialog.SetRange(row.control, RangeIn(dialog, row));
@@ -110,7 +110,7 @@ std::string ValueIn(const SetupDialog& dialog, const DestinationSource& destinat
   if ((row.type & KEY_FLAG) != 0) return std::to_string(FlagIn(dialog, row));
   if ((row.type & KEY_DESTINATION) != 0) return DestinationIn(dialog, destinations, row);
   if ((row.type & KEY_CHOICE) != 0) return std::to_string(ChoiceIn(dialog, row));
-  if ((row.type & KEY_COLOUR) != 0) return std::to_string(dialog.Colour(row.control));
+  if ((row.type & KEY_COLOR) != 0) return std::to_string(dialog.Color(row.control));
   return dialog.Text(row.control);
 }
 
@@ -145,7 +145,7 @@ bool ShowsDefault(const SetupDialog& dialog, const DestinationSource& destinatio
     return dialog.Selected(row.control) == DestinationPosition(destinations.Extensions(), DefaultText(row));
   }
   if ((row.type & KEY_CHOICE) != 0) return dialog.Selected(row.control) == PositionOf(row, DefaultNumber(row));
-  if ((row.type & KEY_COLOUR) != 0) return dialog.Colour(row.control) == DefaultNumber(row);
+  if ((row.type & KEY_COLOR) != 0) return dialog.Color(row.control) == DefaultNumber(row);
   return dialog.Text(row.control) == DefaultValueText(row);
 }
 

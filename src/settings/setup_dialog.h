@@ -26,8 +26,8 @@ class SetupDialog {
   virtual std::string Text(uint32_t control) const = 0;
   virtual void LimitText(uint32_t control, size_t bytes) = 0;
   virtual void SetRange(uint32_t control, const SpinRange& range) = 0;
-  virtual void SetColour(uint32_t control, int32_t colour) = 0;  // 0x00BBGGRR
-  virtual int32_t Colour(uint32_t control) const = 0;
+  virtual void SetColour(uint32_t control, int32_t color) = 0;  // 0x00BBGGRR
+  virtual int32_t Color(uint32_t control) const = 0;
   // A combo or list box; positions count from 0, -1 is none.
   virtual void SetChoices(uint32_t control, std::span<const std::string> texts) = 0;
   virtual void Select(uint32_t control, int32_t position) = 0;

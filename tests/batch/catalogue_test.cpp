@@ -72,19 +72,19 @@ TEST(CatalogueDrawing, NamesStayInTheirBand) {
     PackedImage page;
     ASSERT_EQ(NewCataloguePage(look, page), Status::Ok);
     DrawCell(look, 0, {}, text, &font, page);
-    int32_t left = 1000, right = 0, top = 1000, bottom = 0, grey = 0;
+    int32_t left = 1000, right = 0, top = 1000, bottom = 0, gray = 0;
     for (int32_t y = 0; y < page.Height(); ++y) {
       for (int32_t x = 0; x < page.Width(); ++x) {
         const int32_t pixel = page.PixelAt(x, y);
         if (pixel == 0) continue;
         left = std::min(left, x), right = std::max(right, x), top = std::min(top, y), bottom = std::max(bottom, y);
-        grey += pixel != 0xFFFFFF;
+        gray += pixel != 0xFFFFFF;
       }
     }
     // The room ends at row 12 + 2 + 96; the band is 3 to 18 below it.
     EXPECT_TRUE(top >= 113 && bottom < 128 && left >= 14 && right < 110) << text;
     EXPECT_NEAR(left - 14, 109 - right, 3) << text;
-    EXPECT_GT(grey, 0) << text;
+    EXPECT_GT(gray, 0) << text;
   }
 }
 

@@ -84,11 +84,11 @@ TEST(DrawThumbnail, FillsTheSquareOfItsFlags) {
   EXPECT_EQ(canvas.PixelAt(1, 0), (255 * 5 + 3) / 6 * 0x010101);
 }
 
-TEST(DrawThumbnail, TurnsGreyTermByTermAndClips) {
+TEST(DrawThumbnail, TurnsGrayTermByTermAndClips) {
   ThumbnailRecord record;
   record.Fill(0x3264ff);  // blue 50, green 100, red 255
   PackedImage canvas = Canvas(10);
-  ASSERT_TRUE(DrawThumbnailRecord(canvas, record, -90, 5, kDrawGrey));
+  ASSERT_TRUE(DrawThumbnailRecord(canvas, record, -90, 5, kDrawGray));
   EXPECT_EQ(canvas.PixelAt(5, 5), (76 + 59 + 5) * 0x010101);
   EXPECT_EQ(canvas.PixelAt(6, 5), 0);
   EXPECT_EQ(canvas.PixelAt(5, 4), 0);

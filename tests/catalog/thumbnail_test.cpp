@@ -24,7 +24,7 @@ using testing::ElementsAre;
 
 constexpr Color kMatte = 0x332211;  // red 0x11, green 0x22, blue 0x33
 
-// A picture of one colour.
+// A picture of one color.
 PicturePointer Plain(int32_t width, int32_t height, uint8_t blue, uint8_t green, uint8_t red) {
   PicturePointer picture = MakePicture(width, height, 24);
   for (int32_t y = 0; y < height; ++y) {

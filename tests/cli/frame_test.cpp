@@ -91,7 +91,7 @@ TEST(Frame, UnwritableOutputIsAFailure) {
   std::fclose(messages);
 }
 
-TEST(Frame, ColourFollowsOptionTerminalAndEnvironment) {
+TEST(Frame, ColorFollowsOptionTerminalAndEnvironment) {
   const struct {
     const char* name;
     std::vector<std::string> options;

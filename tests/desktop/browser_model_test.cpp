@@ -177,7 +177,7 @@ TEST(Toolbar, KeepsOrderAndSetAndTakesNewButtonsIn) {
   EXPECT_EQ(ParseToolbar("setup\r\n-view\ngone\nsetup\n-\nconvert\n", known), expected);
 }
 
-// The system's colours: background, text, highlight and its text.
+// The system's colors: background, text, highlight and its text.
 TEST(Palette, EveryTextIsReadable) {
   const Shade systems[][4] = {
       {{255, 255, 255}, {0, 0, 0}, {0x35, 0x84, 0xe4}, {255, 255, 255}},           // light

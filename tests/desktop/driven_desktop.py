@@ -207,13 +207,13 @@ def run(*tests):
 
 
 def gif_of_frames(delays, size=(400, 300)):
-    """An animation of frames in one colour each, for ever; delays in hundredths of a second."""
+    """An animation of frames in one color each, for ever; delays in hundredths of a second."""
     def block(data):
         return b"".join(bytes([len(data[i:i + 255])]) + data[i:i + 255] for i in range(0, len(data), 255)) + b"\0"
 
     width, height = size
-    colours = bytes((40 * i * j) % 256 for i in range(1, 9) for j in (1, 2, 3))
-    gif = b"GIF89a" + struct.pack("<2H3B", width, height, 0xF2, 0, 0) + colours + b"!\xff\x0bNETSCAPE2.0\3\1\0\0\0"
+    colors = bytes((40 * i * j) % 256 for i in range(1, 9) for j in (1, 2, 3))
+    gif = b"GIF89a" + struct.pack("<2H3B", width, height, 0xF2, 0, 0) + colors + b"!\xff\x0bNETSCAPE2.0\3\1\0\0\0"
     for number, delay in enumerate(delays):
         # A code of 4 bits a pixel, and a clear code often enough that codes stay that long.
         codes = [code for i in range(width * height) for code in ([8, number % 8] if i % 6 == 0 else [number % 8])] + [9]
@@ -224,16 +224,16 @@ def gif_of_frames(delays, size=(400, 300)):
 
 
 def make_pictures(folder, names):
-    """Small pictures of different colours, made from a sample by the command line."""
+    """Small pictures of different colors, made from a sample by the command line."""
     folder.mkdir(exist_ok=True)
-    sample = PROJECT / "samples/bmp-true-colour.bmp"
+    sample = PROJECT / "samples/bmp-true-color.bmp"
     for name in names:
         target = folder / name
         if target.suffix == ".bmp":
             shutil.copy(sample, target)
         else:
             program = os.environ.get("FOTOMILL", str(PROJECT / "build/release/fotomill"))
-            made = folder / ("bmp-true-colour" + target.suffix)
+            made = folder / ("bmp-true-color" + target.suffix)
             subprocess.run([program, "convert", str(sample), "--to", target.suffix[1:], "--dest", str(folder)], check=True,
                            stdout=subprocess.DEVNULL)
             made.rename(target)

@@ -65,7 +65,7 @@ class Reports : public testing::Test {
     SetDataFolder({});
   }
   std::string Sample(const std::string& name) {
-    test::WriteBytes(folder_.Path(name), test::ReadBytes(test::SourcePath("samples/bmp-true-colour.bmp")));
+    test::WriteBytes(folder_.Path(name), test::ReadBytes(test::SourcePath("samples/bmp-true-color.bmp")));
     return folder_.Path(name);
   }
 

@@ -124,7 +124,7 @@ TEST(DrawView, SquaresShowThroughAndStayInPlace) {
   view.Pan(-1, 0);
   DrawView(source, view, squares, false, canvas);
   EXPECT_EQ(Greens(canvas, 0), (std::vector<int>{100, 100, 200, 200, 10, 10}));
-  // Between pixels, what is transparent gives no colour away: from 10 to the square behind without a shade of 7.
+  // Between pixels, what is transparent gives no color away: from 10 to the square behind without a shade of 7.
   view.ZoomTo(4, 0, 0);
   view.Pan(-100, 0);
   DrawView(source, view, {.around = 0x000a00}, true, canvas);
@@ -190,7 +190,7 @@ TEST(PhotoFacts, TellWhatPhotographersAsk) {
 
 TEST(Thumbnail, MatteIsCutOff) {
   RgbImage square = FilledImage(6, 6, 0x112233);
-  for (int32_t y = 2; y < 4; ++y) square.Row(y)[3] = 9;  // a picture of 4 by 2 whose right side has the matte's colour
+  for (int32_t y = 2; y < 4; ++y) square.Row(y)[3] = 9;  // a picture of 4 by 2 whose right side has the matte's color
   const RgbImage cut = WithoutMatte(square, 0x112233);
   EXPECT_EQ(cut.width, 4);
   EXPECT_EQ(cut.height, 2);
@@ -201,7 +201,7 @@ TEST(Thumbnail, MatteIsCutOff) {
 TEST(Thumbnail, DatabaseModesKeepWhatTheyMade) {
   const test::TemporaryFolder folder;
   const std::string picture = folder.Path("a.bmp");
-  std::filesystem::copy_file(test::SourcePath("samples/bmp-true-colour.bmp"), picture);
+  std::filesystem::copy_file(test::SourcePath("samples/bmp-true-color.bmp"), picture);
   ThumbnailWish wish{picture, 1, 1, 96, choice::kLocalDatabase};
   for (int time = 0; time < 2; ++time) {  // the second time it comes from the database
     const ThumbnailPointer thumbnail = LoadThumbnail(wish);
@@ -232,7 +232,7 @@ TEST(Thumbnail, StandInsComeFromTheExif) {
   picture->metadata.exif = test::Hex("49492A00 08000000 0100 1201 0300 01000000 06000000 00000000");  // to be turned right
   ASSERT_TRUE(ReplaceExifThumbnail(picture->metadata.exif, test::ReadBytes(small), 65527));
   ASSERT_EQ(WritePicture(*picture, large, {}), Status::Ok);
-  std::filesystem::copy_file(test::SourcePath("samples/bmp-true-colour.bmp"), plain);
+  std::filesystem::copy_file(test::SourcePath("samples/bmp-true-color.bmp"), plain);
   ThumbnailWish wish{large, 1, 1, 176, choice::kDiskBased, true};
   const ThumbnailPointer standIn = LoadThumbnail(wish);
   ASSERT_NE(standIn, nullptr);

@@ -31,7 +31,7 @@ struct Keeping {
 // clang-format off
 constexpr Keeping kKeepings[] = {
     {"MAC", Keeps::Nothing},                        // one size for all pictures
-    {"FIT", Keeps::Size}, {"FTS", Keeps::Size},     // grey only
+    {"FIT", Keeps::Size}, {"FTS", Keeps::Size},     // gray only
     {"JPG", Keeps::Size}, {"JPEG", Keeps::Size},    // lossy
     {"JPE", Keeps::Size}, {"JFI", Keeps::Size},
     {"JFIF", Keeps::Size},  {"WEBP", Keeps::Size},
@@ -56,7 +56,7 @@ void ForEachRow(bool writable, Action action) {
   }
 }
 
-// The colour at a place, 0x00RRGGBB, whatever the depth.
+// The color at a place, 0x00RRGGBB, whatever the depth.
 int32_t ColorAt(const PackedImage& image, int32_t x, int32_t y) {
   const int32_t value = image.PixelAt(x, y);
   if (image.Bits() == 24) return value;

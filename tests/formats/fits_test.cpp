@@ -59,17 +59,17 @@ TEST(Fits, WritesHeaderRowsAndPadding) {
   EXPECT_EQ(written.substr(7880), std::string(760, '\0'));
 }
 
-TEST(Fits, WritesGreyOfEveryDepth) {
+TEST(Fits, WritesGrayOfEveryDepth) {
   const struct {
     const char* name;
     int32_t width, bitsPerPixel;
-    Bytes row, grey;
+    Bytes row, gray;
   } rows[] = {
       {"1 bit: white and black whatever the palette", 10, 1, Hex("A5 7F"), Hex("FF 00 FF 00 00 FF 00 FF 00 FF")},
       {"4 bits, high half first", 3, 4, Hex("1F 20"), Hex("0F 0C 1E")},
-      {"2 bits name four colours", 4, 2, Hex("12 34"), Hex("0F 1E 0B 00")},
+      {"2 bits name four colors", 4, 2, Hex("12 34"), Hex("0F 1E 0B 00")},
       {"8 bits", 3, 8, Hex("00 01 03"), Hex("63 0F 0B")},
-      {"6 bits name 64 colours", 2, 6, Hex("01 40"), Hex("0F 00")},
+      {"6 bits name 64 colors", 2, 6, Hex("01 40"), Hex("0F 00")},
       {"24 bits: each product is rounded down", 3, 24, Hex("09 09 09  FF FF FF  05 5A C8"), Hex("07 FE 71")},
   };
   const Bytes palette =
@@ -83,12 +83,12 @@ TEST(Fits, WritesGreyOfEveryDepth) {
     picture->palette.fill(0);
     std::copy(palette.begin(), palette.end(), picture->palette.begin());
     picture->palette[3 * 15] = picture->palette[3 * 64] = 42;  // 12
-    EXPECT_EQ(WrittenRow(*picture), row.grey);
+    EXPECT_EQ(WrittenRow(*picture), row.gray);
   }
 }
 
 // Rows long enough for every way of computing them, with an odd end.
-TEST(Fits, GreyOfEveryLevelFollowsTheFormula) {
+TEST(Fits, GrayOfEveryLevelFollowsTheFormula) {
   Bytes row, expected;
   for (unsigned i = 0; i < 3 * 1024 + 13; ++i) {
     const unsigned level = i % 256, others = i * 7 / 3 % 256, blue = i < 256 ? level : others,
@@ -199,7 +199,7 @@ TEST(Fits, ShowsTheBytesOfEachRowAsTheyAre) {
     WriteText(path, Header(std::string(row.cards) + "|NAXIS2=2|BZERO=100|BSCALE=3") + row.data);
     const PicturePointer picture = NewPictureRecord();
     ASSERT_EQ(FitsRead(*picture, path.c_str()), Status::Ok);
-    EXPECT_EQ(picture->palette, GreyRamp());
+    EXPECT_EQ(picture->palette, GrayRamp());
     const auto top = picture->image.Row(0), bottom = picture->image.Row(1);
     EXPECT_EQ(Bytes(top.begin(), top.end()), row.top);
     EXPECT_EQ(Bytes(bottom.begin(), bottom.end()), row.bottom);

@@ -13,7 +13,7 @@ namespace {
 
 using Bytes = std::vector<uint8_t>;
 
-// Four colours: 000000 FF0000 00FF00 0000FF.
+// Four colors: 000000 FF0000 00FF00 0000FF.
 constexpr const char* kPalette = "000000 FF0000 00FF00 0000FF ";
 // LZW of 2-bit pixels: clear, 1 2 / 3 0, end.
 constexpr const char* kFourPixels = "02 03 8C 06 05 00 ";
@@ -35,7 +35,7 @@ TEST(GifRead, Frames) {
       {"a transparent index becomes alpha", Gif(screen, "21 F9 04 01 0000 02 00 " + place + "00 " + kFourPixels), Status::Ok,
        "FF0000 000000 / 0000FF 000000", "255 0 / 255 255"},
       {"local palette", Gif("0200 0200 00 00 00", place + "81 " + kPalette + kFourPixels), Status::Ok, "1 2 / 3 0", ""},
-      {"no palette reads as greys", Gif("0200 0200 00 00 00", place + "00 " + kFourPixels), Status::Ok, "1 2 / 3 0", ""},
+      {"no palette reads as grays", Gif("0200 0200 00 00 00", place + "00 " + kFourPixels), Status::Ok, "1 2 / 3 0", ""},
       {"a frame smaller than the screen",
        Gif("0300 0200 81 00 00 " + std::string(kPalette), "2C 0100 0000 0200 0200 00 " + std::string(kFourPixels)), Status::Ok,
        "000000 FF0000 00FF00 / 000000 0000FF 000000", "0 255 255 / 0 255 255"},

@@ -27,7 +27,7 @@ TEST(Hdp, QuantizerZeroKeepsEveryPixelAndOthersStayClose) {
       settings.HDPCompression = row.compression;
       settings.HDPWriteOptions = row.options;
       const PicturePointer picture = PatternPicture(45, 37, bits);
-      if (bits == 8) {  // a grey palette keeps the depth
+      if (bits == 8) {  // a gray palette keeps the depth
         for (size_t i = 0; i < 768; ++i) picture->palette[i] = static_cast<uint8_t>(i / 3);
         const PicturePointer same = PatternPicture(45, 37, bits);
         ASSERT_EQ(NewPackedImage(45, 37, &picture->palette, 8, picture->image), Status::Ok);

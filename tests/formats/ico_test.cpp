@@ -40,7 +40,7 @@ TEST(IcoRead, Entries) {
       {"1 bit with a mask", OneIcon(Bitmap("0100", "00000000 0000FF00  40000000  80000000")), Status::Ok, "000000 FF0000",
        "0 255"},
       {"no mask", OneIcon(Bitmap("1800", "010203 040506 0000")), Status::Ok, "030201 060504", ""},
-      {"no colours", OneIcon(Bitmap("1800", "010203")), Status::FileReadError, "", ""},
+      {"no colors", OneIcon(Bitmap("1800", "010203")), Status::FileReadError, "", ""},
       {"a depth that cannot be", OneIcon(Bitmap("0300", "00")), Status::DamagedFile, "", ""},
       {"no entry", "0000 0100 0000", Status::NoImages, "", ""},
       {"the entry points nowhere", "0000 0100 0100  02 01 00 00 0100 2000 00000000 FFFF0000", Status::NoImages, "", ""},

@@ -16,7 +16,7 @@ namespace {
 
 using Bytes = std::vector<uint8_t>;
 
-// Slow changes of colour, which JPEG keeps closely.
+// Slow changes of color, which JPEG keeps closely.
 PicturePointer SmoothPicture(int32_t width, int32_t height) {
   PicturePointer picture = PatternPicture(width, height, 24);
   for (int32_t y = 0; y < height; ++y) {
@@ -56,9 +56,9 @@ TEST(Jpeg, PicturesComeBackCloselyInEveryForm) {
   }
 }
 
-TEST(Jpeg, GreysStayGrey) {
+TEST(Jpeg, GraysStayGray) {
   const PicturePointer picture = PatternPicture(9, 5, 8);
-  picture->palette = GreyRamp();
+  picture->palette = GrayRamp();
   const Decoded back = Decode(JpegRead, Encode(JpegWrite, *picture));
   ASSERT_EQ(back.status, Status::Ok);
   EXPECT_EQ(back.picture->bitsPerPixel, 8);

@@ -64,7 +64,7 @@ TEST(Tiff, SamplesBecomePixels) {
       {"alpha beside",             1,  8, 2, 4, kExtra,  2, "40 20 00 80",             "402000", "128"},
       {"alpha that nobody told",   1,  8, 2, 4, kFormat, 1, "40 20 00 80",             "402000", "128"},
       {"an extra that is not it",  1,  8, 2, 4, kExtra,  0, "40 20 00 80",             "402000", ""},
-      {"grey and alpha",           1,  8, 1, 2, kExtra,  2, "40 80",                   "404040", "128"},
+      {"gray and alpha",           1,  8, 1, 2, kExtra,  2, "40 80",                   "404040", "128"},
   };
   // clang-format on
   for (const Row& row : rows) {

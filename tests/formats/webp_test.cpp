@@ -70,7 +70,7 @@ TEST(Webp, FramesAreDrawnOverEachOther) {
     const std::vector<uint8_t>& file;
     int32_t page;
     Status status;
-    const char *left, *middle, *right;  // 3, 12 and 20 from the left: alpha and colour
+    const char *left, *middle, *right;  // 3, 12 and 20 from the left: alpha and color
   };
   const Row rows[] = {
       {replacing, 0, Status::Ok, "255 ff0000", "255 ff0000", "0 000000"},

@@ -38,9 +38,9 @@ TEST(TurnedJpeg, PixelsAreThoseOfJpegtran) {
   const TemporaryFolder folder;
   const std::string old = folder.Path("old.jpg"), theirs = folder.Path("theirs.jpg");
   for (const auto& [width, height] : {std::pair{64, 48}, {64, 44}, {41, 32}, {37, 21}, {7, 40}}) {
-    for (int32_t form = -1; form <= choice::kSubsample420; ++form) {  // -1: grey
+    for (int32_t form = -1; form <= choice::kSubsample420; ++form) {  // -1: gray
       const PicturePointer picture = PatternPicture(width, height, form < 0 ? 8 : 24);
-      if (form < 0) picture->palette = GreyRamp();
+      if (form < 0) picture->palette = GrayRamp();
       settings.JpegSubsample = std::max(form, 0);
       settings.WriteJpegProgressive = (width + form) % 2;
       const Bytes file = Encode(JpegWrite, *picture);

@@ -18,7 +18,7 @@ TEST(PackedImage, StrideAndSizeFollowDepth) {
       {"1 bit, one pixel over a word", 33, 2, 1, 1, 8, 40 + 8 + 16},
       {"3 bits become 4", 3, 1, 3, 4, 4, 40 + 64 + 4},
       {"6 bits become 8", 5, 2, 6, 8, 8, 40 + 1024 + 16},
-      {"24 bits have no colour table", 1, 3, 24, 24, 4, 40 + 12},
+      {"24 bits have no color table", 1, 3, 24, 24, 4, 40 + 12},
       {"32 bits are held as 24", 1, 1, 32, 24, 4, 40 + 4},
   };
   for (const Row& row : rows) {

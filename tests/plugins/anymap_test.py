@@ -26,7 +26,7 @@ def convert(source, extension, folder):
 
 failed = 0
 with tempfile.TemporaryDirectory() as folder:
-    for name in ("bmp-true-colour.bmp", "bmp-256-colours.bmp", "bmp-mono.bmp"):
+    for name in ("bmp-true-color.bmp", "bmp-256-colors.bmp", "bmp-mono.bmp"):
         source = PROJECT / "samples" / name
         if not source.exists():
             print(f"{name}: no such sample")

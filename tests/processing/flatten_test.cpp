@@ -57,7 +57,7 @@ TEST(Flatten, PalettePicturesAreBlendedToo) {
   };
   const Row rows[] = {
       {"opaque stays as it is", 2, 255, 1},
-      {"the background is a third colour", 2, 0, 4},
+      {"the background is a third color", 2, 0, 4},
       {"shades need more", 16, 250, 8},
       {"too many shades", 256, 0, 24},
   };

@@ -37,7 +37,7 @@ inline void AddAlpha(PictureRecord& picture, const std::function<int32_t(int32_t
   picture.alphaFlags |= kHasAlpha;
 }
 
-// The colour of a pixel, 0x00RRGGBB, at any depth, through the picture's palette.
+// The color of a pixel, 0x00RRGGBB, at any depth, through the picture's palette.
 inline uint32_t ColorAt(const PictureRecord& picture, int32_t x, int32_t y) {
   const int32_t value = picture.image.PixelAt(x, y);
   if (picture.image.Bits() == 24) return static_cast<uint32_t>(value);

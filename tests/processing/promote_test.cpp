@@ -8,7 +8,7 @@ namespace {
 using test::Colors;
 using test::MakePicture;
 
-// `count` colours, all different, in a picture of 37 x 23 pixels.
+// `count` colors, all different, in a picture of 37 x 23 pixels.
 PicturePointer PictureOfColors(uint32_t count) {
   return MakePicture(37, 23, [count](int32_t x, int32_t y) {
     const uint32_t i =
@@ -25,13 +25,13 @@ TEST(Promote, FewColorsArePackedExactlyAndComeBack) {
     int32_t bits;
   };
   const Row rows[] = {
-      {"one colour", 1, 8, 1},
-      {"two colours", 2, 8, 1},
-      {"three colours", 3, 8, 4},
-      {"sixteen colours", 16, 8, 4},
-      {"seventeen colours", 17, 8, 8},
-      {"256 colours", 256, 8, 8},
-      {"257 colours stay", 257, 8, 24},
+      {"one color", 1, 8, 1},
+      {"two colors", 2, 8, 1},
+      {"three colors", 3, 8, 4},
+      {"sixteen colors", 16, 8, 4},
+      {"seventeen colors", 17, 8, 8},
+      {"256 colors", 256, 8, 8},
+      {"257 colors stay", 257, 8, 24},
       {"sixteen where 4 bits are allowed", 16, 4, 4},
       {"seventeen where 4 bits are allowed", 17, 4, 24},
       {"three where 1 bit is allowed", 3, 1, 24},

@@ -14,7 +14,7 @@ namespace {
 using test::Colors;
 using test::MakePicture;
 
-uint32_t Grey(int32_t level) { return static_cast<uint32_t>(level) * 0x010101u; }
+uint32_t Gray(int32_t level) { return static_cast<uint32_t>(level) * 0x010101u; }
 
 PicturePointer Sweep(int32_t width, int32_t height) {
   return MakePicture(width, height, [=](int32_t x, int32_t y) {
@@ -61,15 +61,15 @@ TEST(Reduce, FewColorsAreKeptExactly) {
   }
 }
 
-// Dithering must keep the mean of any area, at every level of grey and in both directions of travel.
-TEST(Reduce, DitheredGreysKeepTheirMean) {
+// Dithering must keep the mean of any area, at every level of gray and in both directions of travel.
+TEST(Reduce, DitheredGraysKeepTheirMean) {
   for (const Dither dither : {Dither::Ordered, Dither::FloydSteinberg}) {
     for (const bool serpentine : {false, true}) {
       for (int32_t level = 0; level <= 255; level += 5) {
         SCOPED_TRACE(testing::Message() << level << ", dither " << static_cast<int32_t>(dither));
-        // Two pixels of other colours keep the picture from being packed exactly.
+        // Two pixels of other colors keep the picture from being packed exactly.
         const PicturePointer picture =
-            MakePicture(128, 128, [level](int32_t x, int32_t y) { return y == 0 && x < 2 ? Grey(100 + x) : Grey(level); });
+            MakePicture(128, 128, [level](int32_t x, int32_t y) { return y == 0 && x < 2 ? Gray(100 + x) : Gray(level); });
         ReduceOptions options;
         options.monoDither = dither;
         options.serpentine = serpentine;
@@ -84,7 +84,7 @@ TEST(Reduce, DitheredGreysKeepTheirMean) {
 
 TEST(Reduce, ThresholdPartsDarkFromBright) {
   const auto makeSteps = [] {
-    return MakePicture(4, 1, [](int32_t x, int32_t) { return Grey(40 + 20 * x * x); });
+    return MakePicture(4, 1, [](int32_t x, int32_t) { return Gray(40 + 20 * x * x); });
   };  // 40 60 120 220
   struct Row {
     const char* name;
@@ -133,7 +133,7 @@ TEST(Reduce, PalettesStayTrueToThePicture) {
     const auto level = [](double t) { return static_cast<uint32_t>(127.5 + 120 * std::sin(t)); };
     return level(x / 40.0) << 16 | level(y / 30.0 + 1) << 8 | level((x + y) / 70.0);
   };
-  // Two clusters of like colours, far apart.
+  // Two clusters of like colors, far apart.
   const auto clusters = [](int32_t x, int32_t y) {
     const uint32_t noise = test::Scatter(x, y);
     return (x < 100 ? 0x181410u : 0xd8d0e0u) + ((noise & 7) << 16 | (noise >> 3 & 7) << 8 | (noise >> 6 & 7));
@@ -146,12 +146,12 @@ TEST(Reduce, PalettesStayTrueToThePicture) {
     double least;
   };
   const Row rows[] = {
-      {"waves, 256 colours", waves, 8, Dither::None, 32.4},
-      {"waves, 256 colours, diffused", waves, 8, Dither::FloydSteinberg, 31.0},
-      {"waves, 256 colours, ordered", waves, 8, Dither::Ordered, 30.2},
-      {"waves, 16 colours", waves, 4, Dither::None, 21.4},
-      {"waves, 16 colours, diffused", waves, 4, Dither::FloydSteinberg, 19.8},
-      {"clusters, 256 colours", clusters, 8, Dither::None, 53.2},
+      {"waves, 256 colors", waves, 8, Dither::None, 32.4},
+      {"waves, 256 colors, diffused", waves, 8, Dither::FloydSteinberg, 31.0},
+      {"waves, 256 colors, ordered", waves, 8, Dither::Ordered, 30.2},
+      {"waves, 16 colors", waves, 4, Dither::None, 21.4},
+      {"waves, 16 colors, diffused", waves, 4, Dither::FloydSteinberg, 19.8},
+      {"clusters, 256 colors", clusters, 8, Dither::None, 53.2},
   };
   for (const Row& row : rows) {
     SCOPED_TRACE(row.name);
@@ -169,8 +169,8 @@ TEST(Reduce, PalettesStayTrueToThePicture) {
 TEST(Reduce, NearestColorIsNearest) {
   std::mt19937 random(11);
   for (const int32_t count : {1, 2, 16, 255, 256}) {
-    for (const int32_t range : {256, 40, 3}) {  // the narrower, the more colours share a cell
-      SCOPED_TRACE(testing::Message() << count << " colours within " << range);
+    for (const int32_t range : {256, 40, 3}) {  // the narrower, the more colors share a cell
+      SCOPED_TRACE(testing::Message() << count << " colors within " << range);
       Palette palette{};
       for (uint8_t& level : palette)
         level = static_cast<uint8_t>((256 - range) / 2 + static_cast<int32_t>(random() % static_cast<uint32_t>(range)));
@@ -195,17 +195,17 @@ TEST(Reduce, NearestColorIsNearest) {
   }
 }
 
-TEST(Reduce, GreysAreEvenAndOnlyGreys) {
+TEST(Reduce, GraysAreEvenAndOnlyGrays) {
   for (const int32_t levels : {0, 2, 5}) {
     SCOPED_TRACE(levels);
     const PicturePointer picture = Sweep(90, 70);
     ReduceOptions options;
-    options.greys = true;
-    options.greyLevels = levels;
+    options.grays = true;
+    options.grayLevels = levels;
     ASSERT_EQ(ReduceColors(*picture, 4, options), Status::Ok);
     std::set<uint32_t> used;
     for (const uint32_t color : Colors(*picture)) used.insert(color);
-    for (const uint32_t color : used) EXPECT_EQ(color, Grey(static_cast<int32_t>(color & 255)));
+    for (const uint32_t color : used) EXPECT_EQ(color, Gray(static_cast<int32_t>(color & 255)));
     EXPECT_LE(used.size(), static_cast<size_t>(levels == 0 ? 16 : levels));
     EXPECT_GE(used.size(), static_cast<size_t>(levels == 0 ? 14 : levels));
   }
@@ -220,10 +220,10 @@ TEST(Reduce, AdjustmentsMoveTheMean) {
   for (const Row& row : {Row{"as it is", 0, 0, 63.5},
                          {"brighter", 20, 0, 114.5},
                          {"darker", -100, 0, 0},
-                         {"all grey", 0, -100, 128},
+                         {"all gray", 0, -100, 128},
                          {"doubled", 0, 100, 31.75}}) {
     SCOPED_TRACE(row.name);
-    const PicturePointer picture = MakePicture(256, 64, [](int32_t x, int32_t) { return Grey(x / 2); });
+    const PicturePointer picture = MakePicture(256, 64, [](int32_t x, int32_t) { return Gray(x / 2); });
     ReduceOptions options;
     options.brightness = row.brightness;
     options.contrast = row.contrast;

@@ -88,7 +88,7 @@ struct Reference {
     for (double& w : weights) w /= sum;
     return weights;
   }
-  // Blue, green, red and alpha of every pixel of the result, row by row; colours already divided by the alpha.
+  // Blue, green, red and alpha of every pixel of the result, row by row; colors already divided by the alpha.
   std::vector<std::array<double, 4>> Scale(const PictureRecord& picture, Size size) const {
     const int32_t width = picture.image.Width(), height = picture.image.Height();
     std::vector<std::array<double, 4>> narrow(static_cast<size_t>(size.width * height)),

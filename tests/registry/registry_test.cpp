@@ -173,15 +173,15 @@ TEST(WritePicture, KeepsTheSourceNameAndFlattensWhereAlphaCannotGo) {
 
 TEST(WritePicture, FlatteningAPalettePictureMayMakeItTooDeep) {
   const TemporaryFolder folder;
-  std::vector<uint8_t> greys(512);
-  for (size_t i = 0; i < greys.size(); ++i) greys[i] = static_cast<uint8_t>(i);
+  std::vector<uint8_t> grays(512);
+  for (size_t i = 0; i < grays.size(); ++i) grays[i] = static_cast<uint8_t>(i);
   for (const uint8_t alpha : {uint8_t{255}, uint8_t{100}}) {
     SCOPED_TRACE(+alpha);
-    const PicturePointer picture = MakePicture(512, 1, 8, {greys});
+    const PicturePointer picture = MakePicture(512, 1, 8, {grays});
     ASSERT_EQ(NewAlphaPlane(512, 1, picture->alpha), Status::Ok);
     for (size_t x = 0; x < 512; ++x) picture->alpha.Row(0)[x] = x < 256 ? 255 : alpha;
     picture->alphaFlags = kHasAlpha | kFlattenOnBackground;
-    picture->background = 0x0000ff;  // greys with red in them are no greys any more: twice as many colours
+    picture->background = 0x0000ff;  // grays with red in them are no grays any more: twice as many colors
     const Status status = WritePicture(*picture, folder.Path("x.fit"), {});
     EXPECT_EQ(status, Status::Ok);
     EXPECT_EQ(picture->bitsPerPixel, alpha == 255 ? 8 : 24);

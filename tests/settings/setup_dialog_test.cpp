@@ -21,7 +21,7 @@ class FakeDialog : public SetupDialog {
     std::string text;
     size_t limit = 0;
     SpinRange range;
-    int32_t colour = -1;
+    int32_t color = -1;
     std::vector<std::string> choices;
     int32_t selected = -1;
   };
@@ -36,8 +36,8 @@ class FakeDialog : public SetupDialog {
   std::string Text(uint32_t control) const override { return controls_.at(control).text; }
   void LimitText(uint32_t control, size_t bytes) override { controls_.at(control).limit = bytes; }
   void SetRange(uint32_t control, const SpinRange& range) override { controls_.at(control).range = range; }
-  void SetColour(uint32_t control, int32_t colour) override { controls_.at(control).colour = colour; }
-  int32_t Colour(uint32_t control) const override { return controls_.at(control).colour; }
+  void SetColour(uint32_t control, int32_t color) override { controls_.at(control).color = color; }
+  int32_t Color(uint32_t control) const override { return controls_.at(control).color; }
   void SetChoices(uint32_t control, std::span<const std::string> texts) override {
     controls_.at(control).choices.assign(texts.begin(), texts.end());
   }
@@ -84,7 +84,7 @@ TEST_F(SetupDialogTest, ShowsEachKindAsItsControlDoes) {
   EXPECT_EQ(dialog.At(FXBrightness).text, "0");
   EXPECT_EQ(dialog.At(JpegCompression).text, "75");
   EXPECT_EQ(dialog.At(JpegCompression).range.maximum, 100);
-  EXPECT_EQ(dialog.At(AlphaBackground).colour, 0xFFFFFF);
+  EXPECT_EQ(dialog.At(AlphaBackground).color, 0xFFFFFF);
   EXPECT_EQ(dialog.At(TiffOptions).choices[static_cast<size_t>(dialog.At(TiffOptions).selected)], "LZW");
   EXPECT_EQ(dialog.At(DefaultViewZoom).selected, 12) << "the place of value 13";
   EXPECT_EQ(dialog.At(JpegProcessor).selected, 1) << "2 lies beyond the list";
@@ -110,7 +110,7 @@ TEST_F(SetupDialogTest, TakesUpWhatWasChanged) {
   dialog.At(PrefixCrop).text = "My ";
   dialog.At(FXBrightness).text = " -20 ";
   dialog.At(JpegCompression).text = "100";
-  dialog.At(AlphaBackground).colour = 0x0000FF;
+  dialog.At(AlphaBackground).color = 0x0000FF;
   dialog.At(TiffOptions).selected = 1;
   dialog.At(DefaultViewZoom).selected = 0;
   dialog.At(JpegProcessor).selected = 0;

@@ -9,7 +9,7 @@ PicturePointer MakePicture(int32_t width, int32_t height, int32_t bitsPerPixel, 
   picture->width = width;
   picture->height = height;
   picture->bitsPerPixel = bitsPerPixel;
-  picture->palette = GreyRamp();
+  picture->palette = GrayRamp();
   if (bitsPerPixel == 1) MakeDefaultPalette(&picture->palette, nullptr, kBlackAndWhitePalette);
   if (NewPackedImage(width, height, &picture->palette, bitsPerPixel, picture->image) != Status::Ok) return nullptr;
   for (size_t y = 0; y < rows.size(); ++y) {

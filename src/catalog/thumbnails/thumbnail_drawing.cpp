@@ -13,7 +13,7 @@ namespace {
 constexpr int32_t kHalfSide = kSmallThumbnailSide / 2;
 
 // Each of the three terms is rounded down by itself.
-void TurnGrey(PackedImage& bitmap) {
+void TurnGray(PackedImage& bitmap) {
   for (int32_t r = 0; r < bitmap.Height(); ++r) {
     uint8_t* pixel = bitmap.StoredRow(r).data();
     for (int32_t i = 0; i < bitmap.Width(); ++i, pixel += 3) {
@@ -66,7 +66,7 @@ Status Resample(const PackedImage& bitmap, int32_t side, PackedImage& scaled) {
 
 Status MakeDrawnBitmap(const AnyThumbnailRecord& record, uint32_t flags, PackedImage& bitmap) {
   RETURN_IF_BAD(std::visit([&](const auto& held) { return ThumbnailRecordToBitmap(held, bitmap); }, record));
-  if ((flags & kDrawGrey) != 0) TurnGrey(bitmap);
+  if ((flags & kDrawGray) != 0) TurnGray(bitmap);
   const int32_t side = DrawnThumbnailSide(record, flags);
   if (side == bitmap.Width()) return Status::Ok;
   const bool filtered = (flags & kDrawLargeView) != 0 && settings.FastZoomedThumbnails == 0;

@@ -15,7 +15,7 @@ using AnyThumbnailRecord = std::variant<ThumbnailRecord, LargeThumbnailRecord>;
 // Bits of `flags`. The large view wins over the half size.
 inline constexpr uint32_t kDrawHalfSize = 2;   // 48 x 48
 inline constexpr uint32_t kDrawLargeView = 4;  // 176 x 176
-inline constexpr uint32_t kDrawGrey = 8;
+inline constexpr uint32_t kDrawGray = 8;
 
 // Edge of the square that a record fills when it is drawn.
 int32_t DrawnThumbnailSide(const AnyThumbnailRecord& record, uint32_t flags);

@@ -14,7 +14,7 @@ struct Point {
   float x, y;  // pixels from the left and the top
 };
 
-// One flat colour inside an outline. An outline of two points is a circle: its middle, and a point on it.
+// One flat color inside an outline. An outline of two points is a circle: its middle, and a point on it.
 struct Shape {
   uint32_t color;  // 0x00RRGGBB
   std::span<const Point> outline;

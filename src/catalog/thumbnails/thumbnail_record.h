@@ -20,7 +20,7 @@ namespace fotomill {
 //        6  258            0
 //      264    3 x side^2   pixels: blue, green, red, bottom row first, rows without padding; side 96, or 176
 //
-// The picture stands in the middle, offsets rounded down; the rest has the background's colour. Small records of versions
+// The picture stands in the middle, offsets rounded down; the rest has the background's color. Small records of versions
 // below 2 hold 96 x 96 indices into ThumbnailPalette() instead, in the same order of rows.
 inline constexpr size_t kThumbnailHeaderSize = 264;
 inline constexpr int16_t kThumbnailVersion = 512;
@@ -49,7 +49,7 @@ struct SquareThumbnailRecord {
     bytes[4] = kThumbnailVersion & 0xff;
     bytes[5] = kThumbnailVersion >> 8;
   }
-  // Gives all pixels one colour.
+  // Gives all pixels one color.
   void Fill(Color color) {
     for (size_t i = kThumbnailHeaderSize; i < bytes.size(); ++i) {
       bytes[i] = static_cast<uint8_t>(color >> (16 - 8 * ((i - kThumbnailHeaderSize) % 3)));

@@ -40,7 +40,7 @@ constexpr const char* kNoFont =
     " There is no font for the names; --no-names does without, the package fonts-dejavu-core has one.";
 constexpr Color kPaper = 0xFFFFFF;
 
-// A colour as people write it, RRGGBB.
+// A color as people write it, RRGGBB.
 std::optional<Color> ColorOf(std::string_view text) {
   uint32_t value = 0;
   if (text.starts_with('#')) text.remove_prefix(1);
@@ -67,7 +67,7 @@ std::string ReadLook(const SheetOptions& options, CatalogueLook& look) {
   if (options.blackText) look.background = kPaper;
   if (!options.background.empty()) {
     const auto color = ColorOf(options.background);
-    if (!color) return "--background takes a colour as RRGGBB, such as FFFFFF.";
+    if (!color) return "--background takes a color as RRGGBB, such as FFFFFF.";
     look.background = *color;
   }
   const Rectangle page = PageSize(look);
@@ -122,9 +122,9 @@ void SetUpContactSheet(CLI::App& app, CommandContext& context) {
   AddNumber(app, "--page-height", options->pageHeight, "N", 1, 65535, "The same for the height");
   AddChoice(app, "--frame", options->frame, "HOW", {"none", "raised", "flat"}, "Frame around each cell; raised unless given");
   AddFlag(app, "--black-text", options->blackText, "Names and flat frames in black, on white unless --background says");
-  AddText(app, "--background", options->background, "RRGGBB", "Colour of the page; 606060 unless given");
+  AddText(app, "--background", options->background, "RRGGBB", "Color of the page; 606060 unless given");
   AddFlag(app, "--no-names", options->noNames, "No names beneath the pictures");
-  AddFlag(app, "--reduce", options->reduce, "Reduce the colours of pages that are too deep for the format");
+  AddFlag(app, "--reduce", options->reduce, "Reduce the colors of pages that are too deep for the format");
   AddNumber(app, "-j,--jobs", options->jobs, "N", 0, INT32_MAX, "Pictures at work at a time; 0, the default, is one a core");
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would be done");
   AddFlag(app, "--json", options->json, "One JSON array of {file, destination, status, message}");

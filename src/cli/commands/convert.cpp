@@ -128,9 +128,9 @@ void SetUpConvert(CLI::App& app, CommandContext& context) {
             "ask (the way on a terminal), replace, keep-both (elsewhere) or skip files of an output's name");
   AddFlag(app, "--keep-tree", options->keepTree, "Rebuild the folders of named folders in --dest");
   AddFlag(app, "--keep-times", options->keepTimes, "Give outputs the times of their sources");
-  AddChoice(app, "--metadata", options->metadata, "HOW", {"keep", "strip"}, "Keep or strip EXIF, XMP and colour profiles");
+  AddChoice(app, "--metadata", options->metadata, "HOW", {"keep", "strip"}, "Keep or strip EXIF, XMP and color profiles");
   AddFlag(app, "--auto-orient", options->autoOrient, "Turn pictures upright as their EXIF says");
-  AddFlag(app, "--reduce", options->reduce, "Reduce the colours of pictures that are too deep for the format");
+  AddFlag(app, "--reduce", options->reduce, "Reduce the colors of pictures that are too deep for the format");
   AddNumber(app, "--quality", options->quality, "N", 1, 100, "Of JPEG and WebP, 1 to 100");
   AddNumber(app, "--page", options->page, "N", 1, INT32_MAX, "Page to take of files with several, from 1");
   AddNumber(app, "-j,--jobs", options->jobs, "N", 0, INT32_MAX, "Pictures at work at a time; 0, the default, is one a core");

@@ -60,7 +60,7 @@ struct CommandContext {
   bool MayAsk() const { return io.Interactive() && !global.noInput; }
   // Whether someone watches how far the command is.
   bool ProgressOn() const { return io.errTerminal && !global.quiet && global.progress != "never"; }
-  // Whether messages, or results, are coloured.
+  // Whether messages, or results, are colored.
   bool ColorOn(bool terminal) const;
 };
 

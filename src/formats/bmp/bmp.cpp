@@ -15,7 +15,7 @@
 //       30    4  compression, written 0                      26       3-byte palette, then the rows
 //       34    4  bytes of all rows
 //       38    8  two resolutions, written 0
-//       46    8  colours used and important
+//       46    8  colors used and important
 //       54       4-byte palette
 //
 // Palette entries are blue, green, red (and 0). Rows run from the bottom up, each padded to 4 bytes; pixels are indices
@@ -24,7 +24,7 @@
 // The reader takes compressions 1 (RLE8) and 2 (RLE4); everything else counts as uncompressed. Its peculiarities:
 // - Both dialects need 54 bytes of header. The palette always has 2^bits entries and follows the 40-byte header,
 // whatever
-//   header size and colours used say; OS/2 pixels follow the palette, whatever the pixel offset says.
+//   header size and colors used say; OS/2 pixels follow the palette, whatever the pixel offset says.
 // - 16 bits with compression 3: the three masks after the header do not count in the pixel offset, so pixels start 12
 //   bytes after it. Masks of 5-6-5 give blue, green, red; all other 16-bit files are 5-5-5 and give red, green, blue.
 // - A 16-bit file may end within its last row.
@@ -75,7 +75,7 @@ struct BmpHeader {
   uint32_t colorsUsed = 0, colorsImportant = 0;
 
   bool IsOs2() const { return infoSize == kOs2InfoSize; }
-  // Whether other programs may find other colours in it: the writer's forms leave no doubt.
+  // Whether other programs may find other colors in it: the writer's forms leave no doubt.
   bool IsPeculiar() const { return (!IsOs2() && infoSize != kWindowsInfoSize) || bits == 16 || (bits > 8 && compression != 0); }
   bool TopDown() const { return height < 0; }
   // The number of rows, 0 when it is more than a height can say.

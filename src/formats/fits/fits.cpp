@@ -1,4 +1,4 @@
-// Flexible Image Transport System (FITS): a header of text cards, then the values of one grey picture, big-endian.
+// Flexible Image Transport System (FITS): a header of text cards, then the values of one gray picture, big-endian.
 //
 //   offset size  content
 //        0   80  a card: keyword of up to 8 characters, "=" in column 9, value; the first keyword is SIMPLE
@@ -9,10 +9,10 @@
 //
 // Reads a card as its keyword up to the first blank or "=", then its value behind all blanks and "="; a repeated
 // keyword counts as it stands last. Of more than two axes the first plane is read. The picture shows the first bytes of
-// each row as they are in the file, one byte a pixel, through a grey palette: values wider than a byte show as their
+// each row as they are in the file, one byte a pixel, through a gray palette: values wider than a byte show as their
 // single bytes, and BSCALE and BZERO change nothing.
 //
-// Writes eleven cards and one byte of grey per pixel.
+// Writes eleven cards and one byte of gray per pixel.
 //
 // Source: IAU FITS Working Group, "Definition of the Flexible Image Transport System (FITS)", version 4.0 (2018).
 #include "formats/fits/fits.h"
@@ -115,7 +115,7 @@ constexpr uint32_t Share(uint8_t level, uint32_t hundredths) { return level * ((
 
 // Each channel's share is rounded for itself.
 constexpr uint32_t kRed = 30, kGreen = 59, kBlue = 11;
-constexpr uint8_t GreyOf(uint8_t red, uint8_t green, uint8_t blue) {
+constexpr uint8_t GrayOf(uint8_t red, uint8_t green, uint8_t blue) {
   return static_cast<uint8_t>(Share(red, kRed) + Share(green, kGreen) + Share(blue, kBlue));
 }
 static_assert([] {
@@ -127,47 +127,47 @@ static_assert([] {
   return true;
 }());
 
-using GreyTable = std::array<uint8_t, 256>;
+using GrayTable = std::array<uint8_t, 256>;
 
-// The greys of a picture's palette; entries that its depth cannot name are black.
-GreyTable PaletteGreys(const PictureRecord& picture) {
-  GreyTable greys{};
+// The grays of a picture's palette; entries that its depth cannot name are black.
+GrayTable PaletteGrays(const PictureRecord& picture) {
+  GrayTable grays{};
   const int32_t depth = std::clamp(picture.bitsPerPixel, 1, 8);
   for (size_t i = 0; i < size_t{1} << depth; ++i) {
     const uint8_t* color = picture.palette.data() + 3 * i;
-    greys[i] = GreyOf(color[0], color[1], color[2]);
+    grays[i] = GrayOf(color[0], color[1], color[2]);
   }
-  return greys;
+  return grays;
 }
 
-// Turn `count` pixels, of which the first is the first of a byte, into grey.
-void GreyBits(const uint8_t* pixels, const GreyTable&, size_t count, uint8_t* out) {
+// Turn `count` pixels, of which the first is the first of a byte, into gray.
+void GrayBits(const uint8_t* pixels, const GrayTable&, size_t count, uint8_t* out) {
   for (size_t x = 0; x < count; ++x) out[x] = (pixels[x / 8] << x % 8 & 0x80) != 0 ? 255 : 0;
 }
 
-void GreyNibbles(const uint8_t* pixels, const GreyTable& greys, size_t count, uint8_t* out) {
-  for (size_t x = 0; x < count; ++x) out[x] = greys[pixels[x / 2] >> (x % 2 == 0 ? 4 : 0) & 15];
+void GrayNibbles(const uint8_t* pixels, const GrayTable& grays, size_t count, uint8_t* out) {
+  for (size_t x = 0; x < count; ++x) out[x] = grays[pixels[x / 2] >> (x % 2 == 0 ? 4 : 0) & 15];
 }
 
-void GreyBytes(const uint8_t* pixels, const GreyTable& greys, size_t count, uint8_t* out) {
-  for (size_t x = 0; x < count; ++x) out[x] = greys[pixels[x]];
+void GrayBytes(const uint8_t* pixels, const GrayTable& grays, size_t count, uint8_t* out) {
+  for (size_t x = 0; x < count; ++x) out[x] = grays[pixels[x]];
 }
 
-void GreyColors(const uint8_t* pixels, const GreyTable&, size_t count, uint8_t* out) {
+void GrayColors(const uint8_t* pixels, const GrayTable&, size_t count, uint8_t* out) {
   constexpr size_t kPiece = 1024;  // the formula runs over planes, which compilers turn into vectors
   uint8_t blue[kPiece], green[kPiece], red[kPiece];
   for (size_t begin = 0; begin < count; begin += kPiece) {
     const size_t size = std::min(count - begin, kPiece);
     SplitColors(pixels + 3 * begin, size, blue, green, red);
-    for (size_t x = 0; x < size; ++x) out[begin + x] = GreyOf(red[x], green[x], blue[x]);
+    for (size_t x = 0; x < size; ++x) out[begin + x] = GrayOf(red[x], green[x], blue[x]);
   }
 }
 
-using GreyPixels = void (*)(const uint8_t*, const GreyTable&, size_t, uint8_t*);
-GreyPixels GreyPixelsFor(int32_t bits) {
-  if (bits == 1) return GreyBits;
-  if (bits == 4) return GreyNibbles;
-  return bits == 8 ? GreyBytes : GreyColors;
+using GrayPixels = void (*)(const uint8_t*, const GrayTable&, size_t, uint8_t*);
+GrayPixels GrayPixelsFor(int32_t bits) {
+  if (bits == 1) return GrayBits;
+  if (bits == 4) return GrayNibbles;
+  return bits == 8 ? GrayBytes : GrayColors;
 }
 
 void WriteCard(ByteWriter& out, std::string_view keyword, std::string_view value = {}) {
@@ -209,7 +209,7 @@ Status DescribePicture(const platform::FileView& file, PictureRecord& picture, F
   picture.simplified = header.bitsPerValue > 8 || header.axes > 2;
   picture.imageBytes = EstimateImageBytes(picture.width, picture.height, 8);
   picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
-  picture.palette = GreyRamp();
+  picture.palette = GrayRamp();
   picture.typeName.AssignCut(std::to_string(header.axes) + " axis - " + std::to_string(header.bitsPerValue) + " bits of grey");
   return Status::Ok;
 }
@@ -263,16 +263,16 @@ Status FitsWrite(PictureRecord& picture, const WriteOptions& options) {
   if (image.Empty()) return Status::MemoryAllocationError;
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
-  const GreyTable greys = PaletteGreys(picture);
+  const GrayTable grays = PaletteGrays(picture);
   WriteHeader(out, image);
-  const GreyPixels greyPixels = GreyPixelsFor(image.Bits());
+  const GrayPixels grayPixels = GrayPixelsFor(image.Bits());
   const auto width = static_cast<size_t>(image.Width()), bits = static_cast<size_t>(image.Bits());
   for (int32_t y = 0; y < image.Height() && !out.Failed(); ++y) {
     picture.ReportRow(y);
     const uint8_t* row = image.Row(y).data();
     for (size_t x = 0; x < width; x += ByteWriter::kMostReserved) {
       const size_t count = std::min(width - x, ByteWriter::kMostReserved);
-      greyPixels(row + x * bits / 8, greys, count, out.Reserve(count));
+      grayPixels(row + x * bits / 8, grays, count, out.Reserve(count));
       out.Used(count);
     }
   }

@@ -18,7 +18,7 @@
 //
 // The reader shows a frame on the logical screen. A first frame that covers the screen and has no transparent index keeps
 // its palette at 1 to 8 bits; everything else becomes 24 bits with an alpha plane, the uncovered screen transparent, as
-// browsers show it. Frames beyond the screen are cut. A file without any palette is read as greys. Bytes of no meaning
+// browsers show it. Frames beyond the screen are cut. A file without any palette is read as grays. Bytes of no meaning
 // between blocks are skipped. A missing end code is no fault, missing pixels are (status 3).
 //
 // The writer makes one frame; 89a with the picture's comment when CreateGif89 is on, interlaced rows with

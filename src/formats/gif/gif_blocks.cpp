@@ -117,7 +117,7 @@ void SkipFrame(ByteReader& bytes) { SkipSubBlocks(bytes); }
 
 void TakeColors(const GifFrame& frame, Palette& palette) {
   if (frame.palette.bits == 0) {
-    palette = GreyRamp();
+    palette = GrayRamp();
     return;
   }
   palette.fill(0);

@@ -43,7 +43,7 @@ struct GifFrame {
   uint64_t dataOffset = 0;  // of the LZW data
   uint8_t pixelBits = 0;    // as the LZW data say
 
-  // Bits per pixel of the picture that this frame is. Two-colour frames are coded with 2 bits.
+  // Bits per pixel of the picture that this frame is. Two-color frames are coded with 2 bits.
   int32_t Depth() const {
     if (palette.bits == 0) return std::clamp<int32_t>(pixelBits, 1, 8);
     return palette.bits == 1 && pixelBits <= 2 ? 1 : std::clamp<int32_t>(std::max<int32_t>(palette.bits, pixelBits), 1, 8);
@@ -66,7 +66,7 @@ Status NextFrame(ByteReader& bytes, GifScreen& screen, GifFrame& frame, GifRemar
 // Passes over the LZW data of a frame.
 void SkipFrame(ByteReader& bytes);
 
-// The palette that a frame's pixels mean, a ramp of greys where the file has none.
+// The palette that a frame's pixels mean, a ramp of grays where the file has none.
 void TakeColors(const GifFrame& frame, Palette& palette);
 // The file row that comes as number `r` of an interlaced picture.
 int32_t InterlacedRow(int32_t r, int32_t height);

@@ -108,7 +108,7 @@ Status GifDrawing::Draw(ByteReader& bytes, const GifFrame& frame, Canvas& canvas
   return Status::Ok;
 }
 
-// The place of a frame, row by row: colours, then alpha.
+// The place of a frame, row by row: colors, then alpha.
 Status GifDrawing::KeepBeneath(const GifFrame& frame, const Canvas& canvas) {
   uint64_t size = 0;
   ForVisibleRows(frame, canvas, [&](int32_t, int32_t, size_t count) { size += 4 * count; });

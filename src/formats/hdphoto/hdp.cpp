@@ -1,8 +1,8 @@
 // HD Photo, also known as JPEG XR: hdp_file.cpp has the layout, hdp_codec.cpp the door to the library, hdp_write.cpp
 // writes.
 //
-// What the reader makes of it: one bit stays one bit, greys become 8 bits, everything else 24 bits, with an alpha plane
-// where the file has alpha; colours that were multiplied by it are divided again. Whole numbers of more than 8 bits are
+// What the reader makes of it: one bit stays one bit, grays become 8 bits, everything else 24 bits, with an alpha plane
+// where the file has alpha; colors that were multiplied by it are divided again. Whole numbers of more than 8 bits are
 // rounded; real numbers and those with a binary point are linear light and get the curve of sRGB, 0 being black and 1
 // white. CMYK is turned into RGB by the usual formula. Brightness and color differences that were never RGB (video) are
 // refused, as are pictures of other channels. The turn is not applied: it travels in an EXIF block. XMP, ICC profile,
@@ -92,7 +92,7 @@ void SamplesToBytes(const uint8_t* row, HdpDepth depth, size_t count, size_t ste
   }
 }
 
-// Pixels of 16 or 32 bits that hold three colours, the widths of which are given from the lowest bit up: blue first.
+// Pixels of 16 or 32 bits that hold three colors, the widths of which are given from the lowest bit up: blue first.
 void PackedToBytes(const uint8_t* row, HdpDepth depth, int32_t width, uint8_t* image) {
   const uint32_t outer = depth == HdpDepth::Rgb101010 ? 10 : 5;
   const uint32_t middle = depth == HdpDepth::Rgb101010 ? 10 : depth == HdpDepth::Rgb565 ? 6 : 5;
@@ -156,9 +156,9 @@ class HdpConverter {
     }
     const uint8_t* source = samples_;
     const auto width = static_cast<size_t>(form_.width), step = size_t{raster_.samples};
-    const size_t first = deep ? 2 : 0;  // deep colours come red first
+    const size_t first = deep ? 2 : 0;  // deep colors come red first
     switch (form_.colors) {
-      case HdpColors::Grey:
+      case HdpColors::Gray:
         for (size_t x = 0; x < width; ++x, source += step) {
           if (raster_.alpha) {
             std::fill_n(image + 3 * x, 3, *source);
@@ -207,7 +207,7 @@ bool HasAlpha(const HdpPage& page) {
 }
 
 int32_t BitsOf(const HdpPage& page) {
-  if (page.image.colors != HdpColors::Grey || HasAlpha(page)) return 24;
+  if (page.image.colors != HdpColors::Gray || HasAlpha(page)) return 24;
   return page.image.depth == HdpDepth::WhiteIsOne || page.image.depth == HdpDepth::BlackIsOne ? 1 : 8;
 }
 
@@ -256,7 +256,7 @@ Status Describe(std::span<const uint8_t> file, HdpPage& page, PictureRecord& pic
 }
 
 const char* ColorsName(HdpColors colors) {
-  constexpr const char* kNames[] = {"grey",         "YUV 4:2:0",    "YUV 4:2:2", "YUV 4:4:4", "CMYK",
+  constexpr const char* kNames[] = {"gray",         "YUV 4:2:0",    "YUV 4:2:2", "YUV 4:4:4", "CMYK",
                                     "CMYK, direct", "any channels", "RGB",       "RGBE"};
   return kNames[static_cast<size_t>(colors)];
 }
@@ -269,7 +269,7 @@ const char* DepthName(HdpDepth depth) {
 }
 
 void AddDetails(const HdpPage& page, const PictureRecord& picture, DetailLines& lines) {
-  constexpr const char* kInternal[] = {"grey", "4:2:0", "4:2:2", "4:4:4", "CMYK", "?", "channels", "?"};
+  constexpr const char* kInternal[] = {"gray", "4:2:0", "4:2:2", "4:4:4", "CMYK", "?", "channels", "?"};
   const HdpStream& image = page.image;
   lines.AddFormat("  Color space: %s", ColorsName(image.colors));
   lines.AddFormat("      Samples: %s", DepthName(image.depth));

@@ -6,7 +6,7 @@
 namespace fotomill {
 
 // HD Photo. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3), MemoryAllocationError (6),
-// UnsupportedFormat (8) for colours that are no picture's, NoImages (20) for a page that is not there. Reading and
+// UnsupportedFormat (8) for colors that are no picture's, NoImages (20) for a page that is not there. Reading and
 // writing also FeatureDisabled (22) where the library is missing.
 Status HdpInfo(PictureRecord& picture, const char* fileName, uint32_t flags);
 Status HdpRead(PictureRecord& picture, const char* fileName);

@@ -120,7 +120,7 @@ SampleShape ShapeOf(const HdpStream& stream) {
   uint32_t bytes = 1;
   switch (stream.depth) {
     case HdpDepth::WhiteIsOne:
-    case HdpDepth::BlackIsOne: return {stream.colors == HdpColors::Grey ? 1u : 0u, 0};
+    case HdpDepth::BlackIsOne: return {stream.colors == HdpColors::Gray ? 1u : 0u, 0};
     case HdpDepth::Rgb555:
     case HdpDepth::Rgb565: return {stream.colors == HdpColors::Rgb ? 1u : 0u, 2};
     case HdpDepth::Rgb101010: return {stream.colors == HdpColors::Rgb ? 1u : 0u, 4};
@@ -131,7 +131,7 @@ SampleShape ShapeOf(const HdpStream& stream) {
     default: bytes = 4; break;
   }
   switch (stream.colors) {
-    case HdpColors::Grey: return {1, bytes};
+    case HdpColors::Gray: return {1, bytes};
     case HdpColors::Rgb: return {3, bytes};
     case HdpColors::Rgbe:
     case HdpColors::Cmyk: return {bytes == 1 || (bytes == 2 && stream.colors == HdpColors::Cmyk) ? 4u : 0u, bytes};
@@ -185,7 +185,7 @@ bool DecodeStream(const DecodeJob& job, HdpRaster& raster, const std::function<v
 Status MakeRaster(const HdpPage& page, HdpRaster& raster) {
   const SampleShape shape = ShapeOf(page.image);
   const bool holdsAlpha = shape.samples >= 3 || (shape.samples == 1 && !page.alpha.bytes.empty() && shape.bytes > 0 &&
-                                                 page.image.colors == HdpColors::Grey);
+                                                 page.image.colors == HdpColors::Gray);
   raster.alpha = holdsAlpha && page.image.colors != HdpColors::Rgbe && (page.image.alpha || !page.alpha.bytes.empty());
   raster.samples = shape.samples + (raster.alpha ? 1 : 0);
   raster.sampleBytes = shape.bytes;
@@ -236,19 +236,19 @@ Status EncodeHdp(const PackedImage& image, const HdpEncoding& encoding, ByteWrit
                  const std::function<void(int32_t)>& report) {
   if (!HasHdpLibrary()) return Status::FeatureDisabled;
   const JxrLibrary& library = Library();
-  const bool grey = image.Bits() == 8;
+  const bool gray = image.Bits() == 8;
   JxrStream target(out);
   CWMImageInfo info = {};
   info.cWidth = static_cast<size_t>(image.Width());
   info.cHeight = static_cast<size_t>(image.Height());
-  info.cfColorFormat = grey ? Y_ONLY : CF_RGB;
+  info.cfColorFormat = gray ? Y_ONLY : CF_RGB;
   info.bdBitDepth = BD_8;
-  info.cBitsPerUnit = grey ? 8 : 24;
+  info.cBitsPerUnit = gray ? 8 : 24;
   info.bRGB = FALSE;
   CWMIStrCodecParam parameters = {};
   parameters.pWStream = &target;
-  parameters.cfColorFormat = grey ? Y_ONLY : YUV_444;
-  parameters.cChannel = grey ? 1 : 3;
+  parameters.cfColorFormat = gray ? Y_ONLY : YUV_444;
+  parameters.cChannel = gray ? 1 : 3;
   parameters.bdBitDepth = BD_LONG;
   parameters.olOverlap = encoding.quantizer == 0 ? OL_NONE : OL_ONE;
   parameters.bfBitstreamFormat = encoding.frequencyOrder ? FREQUENCY : SPATIAL;

@@ -17,7 +17,7 @@ namespace fotomill {
 bool HasHdpLibrary();
 
 // The pixels of a page as the library delivers them: rows from the top, of `stride` bytes; samples of a pixel lie
-// together in the machine's byte order, 8-bit colours as blue, green, red, deeper ones as red, green, blue; alpha comes
+// together in the machine's byte order, 8-bit colors as blue, green, red, deeper ones as red, green, blue; alpha comes
 // last.
 struct HdpRaster {
   platform::SharedBlock block;
@@ -33,7 +33,7 @@ bool CanDecodeHdp(const HdpStream& stream);
 
 // Decodes a page. The library trusts what it reads, so it works apart: a fault in the data that brings it down is
 // DamagedFile like any other. FileReadError when the data end too early, FeatureDisabled without the library,
-// UnsupportedFormat for colours that CanDecodeHdp refuses, MemoryAllocationError. `told` receives finished rows.
+// UnsupportedFormat for colors that CanDecodeHdp refuses, MemoryAllocationError. `told` receives finished rows.
 Status DecodeHdp(const HdpPage& page, HdpRaster& raster, const std::function<void(int32_t)>& told);
 
 struct HdpEncoding {
@@ -41,7 +41,7 @@ struct HdpEncoding {
   bool frequencyOrder = false;
 };
 
-// Encodes an image: grey when it has 8 bits, else colours. `report` is called with finished rows. FeatureDisabled
+// Encodes an image: gray when it has 8 bits, else colors. `report` is called with finished rows. FeatureDisabled
 // without the library, ErrorWritingFile.
 Status EncodeHdp(const PackedImage& image, const HdpEncoding& encoding, ByteWriter& out,
                  const std::function<void(int32_t)>& report);

@@ -6,10 +6,10 @@
 //   "WMPHOTO" 0, version (4 bits: 1), subversion (4)
 //   tiles (1), frequency order (1), turn (3), index table (1), overlap (2)
 //   short numbers (1), long words (1), window (1), trimmed (1), stretched tiles (1), red and blue (1), multiplied (1),
-//   alpha (1) colours (4), depth (4), width - 1, height - 1 (16 bits each when short, else 32) with tiles: columns - 1,
+//   alpha (1) colors (4), depth (4), width - 1, height - 1 (16 bits each when short, else 32) with tiles: columns - 1,
 //   rows - 1 of them (12 each), the width of each column but the last, the height of each row but the last, in blocks
 //   of 16 pixels (8 bits each when short, else 16) with a window: hidden pixels above, left, below, right (6 each); to
-//   the next byte plane: internal colours (3), scaled (1), bands (4), what the colours need, quantizers ...
+//   the next byte plane: internal colors (3), scaled (1), bands (4), what the colors need, quantizers ...
 // Source: ITU-T T.832 (2019), sections 8.3, 8.4 and annex A.
 #include "formats/hdphoto/hdp_file.h"
 
@@ -28,7 +28,7 @@ namespace {
 constexpr uint64_t kEntryBytes = 12;
 constexpr uint8_t kOrientations[] = {1, 4, 2, 3, 6, 7, 5, 8};                        // of EXIF, by turn
 constexpr uint32_t kBlock = 16;                                                      // pixels of a macroblock's side
-constexpr uint32_t kYuv420 = 1, kYuv422 = 2, kYuv444 = 3, kCmyk = 4, kChannels = 6;  // internal colours
+constexpr uint32_t kYuv420 = 1, kYuv422 = 2, kYuv444 = 3, kCmyk = 4, kChannels = 6;  // internal colors
 
 // Bits from the most significant one down; past the end they are 0 and the reader is short.
 class BitReader {
@@ -263,7 +263,7 @@ Status ParseHdpPage(std::span<const uint8_t> file, int32_t page, HdpPage& result
   if (alpha.offset == 0) return Status::Ok;
   RETURN_IF_BAD(ParseHdpStream(Part(file, alpha), result.alpha));
   const bool matches = result.alpha.width == result.image.width && result.alpha.height == result.image.height &&
-                       result.alpha.depth == result.image.depth && result.alpha.colors == HdpColors::Grey;
+                       result.alpha.depth == result.image.depth && result.alpha.colors == HdpColors::Gray;
   return matches ? Status::Ok : Status::DamagedFile;
 }
 

@@ -11,7 +11,7 @@ namespace fotomill {
 
 // What a pixel of an HD Photo codestream is made of.
 enum class HdpColors : uint8_t {
-  Grey = 0,
+  Gray = 0,
   Yuv420 = 1,
   Yuv422 = 2,
   Yuv444 = 3,
@@ -40,15 +40,15 @@ enum class HdpDepth : uint8_t {
 struct HdpStream {
   std::span<const uint8_t> bytes;
   int32_t width = 0, height = 0;
-  HdpColors colors = HdpColors::Grey;
+  HdpColors colors = HdpColors::Gray;
   HdpDepth depth = HdpDepth::U8;
-  bool alpha = false;           // a plane of alpha goes with the colours
-  bool multiplied = false;      // colours were multiplied by alpha
+  bool alpha = false;           // a plane of alpha goes with the colors
+  bool multiplied = false;      // colors were multiplied by alpha
   bool frequencyOrder = false;  // coarse values of the whole picture come first, fine ones last
   uint8_t overlap = 0;          // 0 to 2: how far blocks are smoothed into each other
   uint32_t tiles = 1;
   bool lossless = false;       // every quantizer is 1
-  uint8_t internalColors = 0;  // how the colours are coded: 0 grey, 1 4:2:0, 2 4:2:2, 3 4:4:4, 4 CMYK, 6 any channels
+  uint8_t internalColors = 0;  // how the colors are coded: 0 gray, 1 4:2:0, 2 4:2:2, 3 4:4:4, 4 CMYK, 6 any channels
 };
 
 // Reads the head of a codestream and checks what a decoder would trust. FileReadError when it is cut short, DamagedFile

@@ -1,4 +1,4 @@
-// The HD Photo writer: one page, its directory in front. Greys of 8 bits stay grey, everything else becomes 24-bit RGB,
+// The HD Photo writer: one page, its directory in front. Grays of 8 bits stay gray, everything else becomes 24-bit RGB,
 // coded 4:4:4 with the quantizer HDPCompression (0 loses nothing). HDPWriteOptions with bit 0 set puts the picture into
 // the order of frequencies: coarse values of all of it first. Resolution is the picture's, else TiffResolution.
 #include <algorithm>
@@ -19,9 +19,9 @@ namespace {
 constexpr uint32_t kPixelFormatPlace = 8, kExifPlace = kPixelFormatPlace + 16;
 constexpr uint32_t kInFrequencyOrder = 1;  // of HDPWriteOptions
 
-// Pixel formats 8-bit grey and 24-bit blue, green, red: one name with a number at its end.
+// Pixel formats 8-bit gray and 24-bit blue, green, red: one name with a number at its end.
 constexpr uint8_t kPixelFormat[15] = {0x24, 0xC3, 0xDD, 0x6F, 0x03, 0x4E, 0xFE, 0x4B, 0xB1, 0x85, 0x3D, 0x77, 0x76, 0x8D, 0xC9};
-constexpr uint8_t kGrey8 = 0x08, kBgr24 = 0x0C;
+constexpr uint8_t kGray8 = 0x08, kBgr24 = 0x0C;
 
 // The file's directory, with blocks behind it, each at an even place.
 class Directory {
@@ -76,7 +76,7 @@ class Directory {
   std::vector<Entry> entries_;
 };
 
-bool IsGrey(const PictureRecord& picture) {
+bool IsGray(const PictureRecord& picture) {
   const int colors = picture.image.Colors();
   for (int i = 0; i < colors; ++i) {
     const uint8_t* color = &picture.palette[3 * static_cast<size_t>(i)];
@@ -85,17 +85,17 @@ bool IsGrey(const PictureRecord& picture) {
   return colors > 0;
 }
 
-// The picture as 8-bit grey levels, or as 24-bit colours.
-Status MakeSource(const PictureRecord& picture, bool grey, PackedImage& source) {
+// The picture as 8-bit gray levels, or as 24-bit colors.
+Status MakeSource(const PictureRecord& picture, bool gray, PackedImage& source) {
   const PackedImage& image = picture.image;
   BgrRows rows;
   RETURN_IF_BAD(rows.Open(image));
-  RETURN_IF_BAD(NewPackedImage(image.Width(), image.Height(), &picture.palette, grey ? 8 : 24, source));
+  RETURN_IF_BAD(NewPackedImage(image.Width(), image.Height(), &picture.palette, gray ? 8 : 24, source));
   for (int32_t y = 0; y < image.Height(); ++y) {
     const uint8_t* row = rows.Row(y);
     uint8_t* target = source.Row(y).data();
     const auto width = static_cast<size_t>(image.Width());
-    if (grey) {
+    if (gray) {
       for (size_t x = 0; x < width; ++x) target[x] = row[3 * x];
     } else {
       std::copy_n(row, 3 * width, target);
@@ -141,9 +141,9 @@ Directory MakeDirectory(const PictureRecord& picture, bool keep, const HdpMetada
 }
 
 Status WriteAll(ByteWriter& out, PictureRecord& picture, bool keep) {
-  const bool grey = IsGrey(picture);
+  const bool gray = IsGray(picture);
   PackedImage source;
-  RETURN_IF_BAD(MakeSource(picture, grey, source));
+  RETURN_IF_BAD(MakeSource(picture, gray, source));
   // The EXIF directories stand in front, where their place is known, then the file's own.
   HdpMetadata extra;
   if (keep) extra.exif = ParseExifBlock(picture.metadata.exif);
@@ -161,7 +161,7 @@ Status WriteAll(ByteWriter& out, PictureRecord& picture, bool keep) {
   out.Text("II\xBC\x01");
   out.Le32(directoryAt);
   out.Bytes(kPixelFormat);
-  out.U8(grey ? kGrey8 : kBgr24);
+  out.U8(gray ? kGray8 : kBgr24);
   out.Bytes(extra.placed.bytes);
   directory.Pointer(kHdpPixelFormat, kHdpByte, 16, kPixelFormatPlace);
   directory.Write(out);

@@ -6,13 +6,13 @@
 //        4    2  number of entries
 //        6       entries of 16 bytes:
 //       +0    2  width and height, 0 for 256
-//       +2    2  number of colours, reserved
+//       +2    2  number of colors, reserved
 //       +4    4  icons: planes and bits per pixel; cursors: hot spot x and y
 //       +8    4  bytes of the entry's picture
 //      +12    4  its offset
 //
 // A picture is a whole PNG file, or a bitmap without file header: a 40-byte information header whose height counts both of
-// the following bitmaps, the palette of blue, green, red, 0, the colours at 1, 4, 8, 16, 24 or 32 bits, then the AND mask
+// the following bitmaps, the palette of blue, green, red, 0, the colors at 1, 4, 8, 16, 24 or 32 bits, then the AND mask
 // at 1 bit (set: transparent). Rows run from the bottom up, each padded to 4 bytes.
 //
 // The reader takes the largest entry, among equals the deepest, by what the pictures themselves say: the numbers in the
@@ -96,7 +96,7 @@ struct IcoBitmap {
   }
 };
 
-// Ok; DamagedFile for a header that makes no sense, UnsupportedFormat for compression, FileReadError for missing colours.
+// Ok; DamagedFile for a header that makes no sense, UnsupportedFormat for compression, FileReadError for missing colors.
 Status ParseBitmap(std::span<const uint8_t> entry, IcoBitmap& bitmap) {
   ByteReader bytes(entry);
   const uint32_t infoSize = bytes.Le32();
@@ -187,7 +187,7 @@ void DescribeBitmap(const IcoBitmap& bitmap, PictureRecord& picture) {
 
 uint8_t FiveToEight(uint32_t value) { return static_cast<uint8_t>(value << 3 | value >> 2); }
 
-// The colour of column x as blue, green, red.
+// The color of column x as blue, green, red.
 void ColorAt(const IcoBitmap& bitmap, std::span<const uint8_t> row, size_t x, uint8_t* color) {
   if (bitmap.bits == 16) {
     const uint32_t value = static_cast<uint32_t>(row[2 * x] | row[2 * x + 1] << 8);

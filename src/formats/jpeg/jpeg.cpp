@@ -2,9 +2,9 @@
 //
 //   FF D8, then segments of FF, a marker byte, a length (2 bytes, itself included) and data:
 //   E0 "JFIF" resolution      E1 "Exif\0\0" EXIF, "http://ns.adobe.com/xap/1.0/\0" XMP      E2 "ICC_PROFILE\0" n of m
-//   EE "Adobe" colour transform      FE comment      DB, C4 tables      C0-CF frame      DA scan and its data      D9 end
+//   EE "Adobe" color transform      FE comment      DB, C4 tables      C0-CF frame      DA scan and its data      D9 end
 //
-// Grey pictures become 8 bits with a grey palette, all others 24 bits. CMYK and YCCK are turned into RGB by the usual
+// Gray pictures become 8 bits with a gray palette, all others 24 bits. CMYK and YCCK are turned into RGB by the usual
 // formula, with the inverted values that Adobe's programs store. EXIF, XMP, ICC profile, comment and resolution travel with
 // the picture; its orientation is not applied here.
 //
@@ -12,7 +12,7 @@
 // over is told in the record's `warning`, and the picture is shown with it; a missing end marker is no fault.
 //
 // The writer makes baseline or progressive files (WriteJpegProgressive) of quality JpegCompression and chroma sampling
-// JpegSubsample. Greys stay grey; other palettes are promoted. JpegStoreDPI stores a resolution: the picture's, else
+// JpegSubsample. Grays stay gray; other palettes are promoted. JpegStoreDPI stores a resolution: the picture's, else
 // TiffResolution.
 // Source: ITU-T T.81 (1992) and T.871 (2011); Adobe Technical Note 5116; XMP specification part 3; ICC.1:2022, annex B.4.
 #include "formats/jpeg/jpeg.h"
@@ -47,7 +47,7 @@ Status ReadHeader(JpegReader& reader, std::span<const uint8_t> file) {
   });
 }
 
-bool IsGrey(const jpeg_decompress_struct& info) { return info.jpeg_color_space == JCS_GRAYSCALE; }
+bool IsGray(const jpeg_decompress_struct& info) { return info.jpeg_color_space == JCS_GRAYSCALE; }
 bool IsCmyk(const jpeg_decompress_struct& info) { return info.jpeg_color_space == JCS_CMYK || info.jpeg_color_space == JCS_YCCK; }
 
 std::string_view DataOf(const jpeg_marker_struct& marker) {
@@ -98,10 +98,10 @@ Status DescribePicture(const jpeg_decompress_struct& info, PictureRecord& pictur
   picture.typeName.AssignCut(info.progressive_mode ? "Progressive JPEG" : "JPEG");
   picture.width = static_cast<int32_t>(info.image_width);
   picture.height = static_cast<int32_t>(info.image_height);
-  picture.bitsPerPixel = IsGrey(info) ? 8 : 24;
+  picture.bitsPerPixel = IsGray(info) ? 8 : 24;
   picture.imageBytes = EstimateImageBytes(picture.width, picture.height, picture.bitsPerPixel);
-  if (IsGrey(info)) {
-    picture.palette = GreyRamp();
+  if (IsGray(info)) {
+    picture.palette = GrayRamp();
   } else {
     MakeDefaultPalette(&picture.palette, nullptr, kDisplayPalette);
   }
@@ -109,9 +109,9 @@ Status DescribePicture(const jpeg_decompress_struct& info, PictureRecord& pictur
   return picture.width < 1 || picture.height < 1 ? Status::DamagedFile : Status::Ok;
 }
 
-// Sets what comes out: colours, and the smallest size in eighths whose longer edge is still twice the side asked for.
+// Sets what comes out: colors, and the smallest size in eighths whose longer edge is still twice the side asked for.
 void SetOutput(jpeg_decompress_struct& info, int32_t thumbnailSide) {
-  info.out_color_space = IsGrey(info) ? JCS_GRAYSCALE : IsCmyk(info) ? JCS_CMYK : JCS_EXT_BGR;
+  info.out_color_space = IsGray(info) ? JCS_GRAYSCALE : IsCmyk(info) ? JCS_CMYK : JCS_EXT_BGR;
   info.scale_denom = 8;
   info.scale_num = 8;
   const auto longer = static_cast<int64_t>(std::max(info.image_width, info.image_height));
@@ -181,7 +181,7 @@ void TakeLastBuffer(j_compress_ptr info) {
   static_cast<ByteWriter*>(info->client_data)->Used(ByteWriter::kMostReserved - info->dest->free_in_buffer);
 }
 
-bool HasGreyPalette(const PictureRecord& picture) {
+bool HasGrayPalette(const PictureRecord& picture) {
   const size_t colors = static_cast<size_t>(picture.image.Colors());
   for (size_t i = 0; i < colors; ++i) {
     if (picture.palette[3 * i] != picture.palette[3 * i + 1] || picture.palette[3 * i] != picture.palette[3 * i + 2])
@@ -205,7 +205,7 @@ void SetResolution(jpeg_compress_struct& info, const PictureMetadata& metadata) 
   info.Y_density = clamp(metadata.dpiY > 0 ? metadata.dpiY : settings.TiffResolution);
 }
 
-void SetParameters(JpegWriter& writer, const PictureRecord& picture, bool grey) {
+void SetParameters(JpegWriter& writer, const PictureRecord& picture, bool gray) {
   jpeg_compress_struct& info = writer.info;
   jpeg_create_compress(&info);
   info.client_data = &writer.out;
@@ -215,8 +215,8 @@ void SetParameters(JpegWriter& writer, const PictureRecord& picture, bool grey) 
   writer.destination.term_destination = TakeLastBuffer;
   info.image_width = static_cast<JDIMENSION>(picture.image.Width());
   info.image_height = static_cast<JDIMENSION>(picture.image.Height());
-  info.input_components = grey ? 1 : 3;
-  info.in_color_space = grey ? JCS_GRAYSCALE : JCS_EXT_BGR;
+  info.input_components = gray ? 1 : 3;
+  info.in_color_space = gray ? JCS_GRAYSCALE : JCS_EXT_BGR;
   jpeg_set_defaults(&info);
   jpeg_set_quality(&info, std::clamp<int>(settings.JpegCompression, 1, 100), TRUE);
   SetSampling(info);
@@ -260,15 +260,15 @@ void WriteMetadata(jpeg_compress_struct& info, PictureRecord& picture) {
   (void)WriteSegment(info, JPEG_COM, {}, picture.comment);
 }
 
-// A row as the encoder takes it: greys, or blue, green, red.
-void ExpandRow(const PictureRecord& picture, int32_t y, bool grey, std::vector<uint8_t>& target) {
+// A row as the encoder takes it: grays, or blue, green, red.
+void ExpandRow(const PictureRecord& picture, int32_t y, bool gray, std::vector<uint8_t>& target) {
   const auto row = picture.image.Row(y);
   const auto bits = static_cast<size_t>(picture.image.Bits());
   const size_t perByte = 8 / bits;
   const uint32_t mask = (1u << bits) - 1;
   for (size_t x = 0; x < static_cast<size_t>(picture.image.Width()); ++x) {
     const uint8_t* color = &picture.palette[3 * (row[x / perByte] >> (perByte - 1 - x % perByte) * bits & mask)];
-    if (grey) {
+    if (gray) {
       target[x] = color[0];
     } else {
       target[3 * x] = color[2];
@@ -280,14 +280,14 @@ void ExpandRow(const PictureRecord& picture, int32_t y, bool grey, std::vector<u
 
 Status WriteAll(JpegWriter& writer, PictureRecord& picture, bool keep) {
   const PackedImage& image = picture.image;
-  const bool grey = HasGreyPalette(picture);
-  std::vector<uint8_t> expanded(image.Bits() == 24 ? 0 : (grey ? 1 : 3) * static_cast<size_t>(image.Width()));
+  const bool gray = HasGrayPalette(picture);
+  std::vector<uint8_t> expanded(image.Bits() == 24 ? 0 : (gray ? 1 : 3) * static_cast<size_t>(image.Width()));
   const bool written = Guarded(writer.errors, [&] {
-    SetParameters(writer, picture, grey);
+    SetParameters(writer, picture, gray);
     jpeg_start_compress(&writer.info, TRUE);
     if (keep) WriteMetadata(writer.info, picture);
     for (int32_t y = 0; y < image.Height(); ++y) {
-      if (!expanded.empty()) ExpandRow(picture, y, grey, expanded);
+      if (!expanded.empty()) ExpandRow(picture, y, gray, expanded);
       JSAMPROW row = expanded.empty() ? const_cast<JSAMPROW>(image.Row(y).data()) : expanded.data();
       jpeg_write_scanlines(&writer.info, &row, 1);
       picture.ReportRow(y);
@@ -299,7 +299,7 @@ Status WriteAll(JpegWriter& writer, PictureRecord& picture, bool keep) {
 
 const char* ColorSpaceName(J_COLOR_SPACE space) {
   switch (space) {
-    case JCS_GRAYSCALE: return "grey";
+    case JCS_GRAYSCALE: return "gray";
     case JCS_RGB: return "RGB";
     case JCS_YCbCr: return "YCbCr";
     case JCS_CMYK: return "CMYK";

@@ -20,7 +20,7 @@ struct TurnedJpeg {
   std::string obstacle;           // why it cannot be turned so without a loss, as a sentence; the picture itself is sound
 };
 
-// Turns the picture of a JPEG file. Edges move only in whole blocks (8 pixels, 16 where colours are stored at half the size):
+// Turns the picture of a JPEG file. Edges move only in whole blocks (8 pixels, 16 where colors are stored at half the size):
 // where a side that changes its end has a rest, that is an obstacle; with `trim` up to 15 rows or columns of pixels are cut
 // off instead. Progressive pictures stay so. The statuses are those of reading; FileReadError (3) for files cut short.
 Status TurnJpeg(std::span<const uint8_t> file, Orientation orientation, bool trim, TurnedJpeg& turned);

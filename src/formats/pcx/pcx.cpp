@@ -2,19 +2,19 @@
 //
 //   offset size  field
 //        0    1  manufacturer, always 10
-//        1    1  version; 3: the fixed sixteen colours; from 5 on an 8-bit file may end in a palette; written 5
+//        1    1  version; 3: the fixed sixteen colors; from 5 on an 8-bit file may end in a palette; written 5
 //        2    1  encoding, written 1; not read: data are always run-length coded
 //        3    1  bits per pixel and plane
 //        4    8  xmin, ymin, xmax, ymax, the corners; written 0, 0, width - 1, height - 1
 //       12    4  two resolutions, written 300
-//       16   48  palette of sixteen colours
+//       16   48  palette of sixteen colors
 //       64    1  reserved
 //       65    1  planes
 //       66    2  bytes per line and plane, used as stored; written without rounding up
 //       68    2  palette information, written 1, or 0 with 24 bits
 //       70   58  filler
 //      128       lines from the top, each with its planes one after the other
-//   end - 769    12 and a palette of 256 colours, with 8 bits
+//   end - 769    12 and a palette of 256 colors, with 8 bits
 //
 // Palettes are red, green, blue. A byte of 0xC0 or more counts in its low six bits how often the byte after it comes;
 // any other byte stands for itself.

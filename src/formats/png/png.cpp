@@ -1,12 +1,12 @@
 // Portable Network Graphics (PNG), big-endian; png_write.cpp writes.
 //
 //   signature 89 50 4E 47 0D 0A 1A 0A, then chunks of length, type, data and CRC:
-//   IHDR  width, height (4 bytes each), bit depth, colour type (1 colour, 2 palette bit, 4 alpha), 0, 0, interlace
+//   IHDR  width, height (4 bytes each), bit depth, color type (1 color, 2 palette bit, 4 alpha), 0, 0, interlace
 //   PLTE, tRNS, pHYs, gAMA, iCCP, eXIf, tEXt, zTXt, iTXt, acTL ..., IDAT (deflated rows), IEND
 //
-// What the reader makes of it: palettes and greys of 1, 2, 4 and 8 bits without transparency keep their depth (greys with
-// a grey palette); everything else becomes 24 bits, with an alpha plane where there is an alpha channel or a transparent
-// colour. 16-bit samples are rounded to 8. Gamma is told, not applied. Of an animation (acTL) the default picture is shown.
+// What the reader makes of it: palettes and grays of 1, 2, 4 and 8 bits without transparency keep their depth (grays with
+// a gray palette); everything else becomes 24 bits, with an alpha plane where there is an alpha channel or a transparent
+// color. 16-bit samples are rounded to 8. Gamma is told, not applied. Of an animation (acTL) the default picture is shown.
 // EXIF, XMP, ICC profile and resolution travel with the picture.
 //
 // libpng reads everything in front of the pixels. Pixels that are not interlaced are inflated by libdeflate as a whole and
@@ -286,7 +286,7 @@ void CopyPixels(const uint8_t* source, size_t width, const PngReader&, uint8_t* 
   std::memcpy(image, source, (width * kBits + 7) / 8);
 }
 
-template <size_t kSamples, size_t kBytes>  // grey or colours, with alpha when the number is even; samples of one or two bytes
+template <size_t kSamples, size_t kBytes>  // gray or colors, with alpha when the number is even; samples of one or two bytes
 void StoreSamples(const uint8_t* source, size_t width, const PngReader&, uint8_t* image, uint8_t* alpha) {
   const auto sample = [](const uint8_t* at) { return kBytes == 1 ? *at : HighByte(at); };
   constexpr size_t kColors = kSamples < 3 ? 1 : 3;
@@ -302,11 +302,11 @@ void StoreColors(const uint8_t* source, size_t width, const PngReader&, uint8_t*
   SwapColors(source, width, image);
 }
 
-void StoreDeepGreys(const uint8_t* source, size_t width, const PngReader&, uint8_t* image, uint8_t*) {
+void StoreDeepGrays(const uint8_t* source, size_t width, const PngReader&, uint8_t* image, uint8_t*) {
   for (size_t x = 0; x < width; ++x) image[x] = HighByte(source + 2 * x);
 }
 
-// Colours of a palette with alpha.
+// Colors of a palette with alpha.
 void StorePaletteAlpha(const uint8_t* source, size_t width, const PngReader& reader, uint8_t* image, uint8_t* alpha) {
   png_bytep opacities = nullptr;
   png_colorp colors = nullptr;
@@ -334,7 +334,7 @@ StoreFileRow FileRowStore(const PngReader& reader, const PngLayout& layout) {
       {PNG_COLOR_TYPE_GRAY, 1, false, CopyPixels<1>},
       {PNG_COLOR_TYPE_GRAY, 4, false, CopyPixels<4>},
       {PNG_COLOR_TYPE_GRAY, 8, false, CopyPixels<8>},
-      {PNG_COLOR_TYPE_GRAY, 16, false, StoreDeepGreys},
+      {PNG_COLOR_TYPE_GRAY, 16, false, StoreDeepGrays},
       {PNG_COLOR_TYPE_PALETTE, 1, false, CopyPixels<1>},
       {PNG_COLOR_TYPE_PALETTE, 4, false, CopyPixels<4>},
       {PNG_COLOR_TYPE_PALETTE, 8, false, CopyPixels<8>},
@@ -390,10 +390,10 @@ Status ReadPixels(PngReader& reader, const PngLayout& layout, PictureRecord& pic
 
 const char* ColorTypeName(png_byte type) {
   switch (type) {
-    case PNG_COLOR_TYPE_GRAY: return "grey";
+    case PNG_COLOR_TYPE_GRAY: return "gray";
     case PNG_COLOR_TYPE_PALETTE: return "palette";
     case PNG_COLOR_TYPE_RGB: return "true color";
-    case PNG_COLOR_TYPE_GRAY_ALPHA: return "grey with alpha";
+    case PNG_COLOR_TYPE_GRAY_ALPHA: return "gray with alpha";
     default: return "true color with alpha";
   }
 }

@@ -1,4 +1,4 @@
-// The PNG writer keeps the depth: palettes of 1, 4 and 8 bits (greys as grey), RGB, or RGBA with an alpha plane. libpng writes
+// The PNG writer keeps the depth: palettes of 1, 4 and 8 bits (grays as gray), RGB, or RGBA with an alpha plane. libpng writes
 // everything in front of the pixels, png_deflate.cpp the pixels, compressed as PngCompression says.
 #include <algorithm>
 #include <cmath>
@@ -38,8 +38,8 @@ void WriteBytes(png_structp png, png_bytep bytes, size_t count) {
 }
 void FlushNothing(png_structp) {}
 
-// Whether the palette is the grey ramp of its depth.
-bool IsGrey(const Palette& palette, int32_t bits) {
+// Whether the palette is the gray ramp of its depth.
+bool IsGray(const Palette& palette, int32_t bits) {
   const int levels = 1 << bits;
   for (int i = 0; i < 3 * levels; ++i) {
     if (palette[static_cast<size_t>(i)] != i / 3 * 255 / (levels - 1)) return false;
@@ -51,7 +51,7 @@ int ColorType(const PictureRecord& picture) {
   const int32_t bits = picture.image.Bits();
   if (!picture.alpha.Empty()) return PNG_COLOR_TYPE_RGB_ALPHA;
   if (bits == 24) return PNG_COLOR_TYPE_RGB;
-  return IsGrey(picture.palette, bits) ? PNG_COLOR_TYPE_GRAY : PNG_COLOR_TYPE_PALETTE;
+  return IsGray(picture.palette, bits) ? PNG_COLOR_TYPE_GRAY : PNG_COLOR_TYPE_PALETTE;
 }
 
 void SetMetadata(const PngWriter& writer, const PictureRecord& picture, bool keep, uint8_t& lost) {
@@ -101,7 +101,7 @@ void SetHeader(const PngWriter& writer, const PictureRecord& picture) {
   }
 }
 
-// A row of red, green, blue, alpha. The colours are put at its end first and go to their places from the left on.
+// A row of red, green, blue, alpha. The colors are put at its end first and go to their places from the left on.
 void MergeRow(const BgrRows& colors, const PackedImage& alpha, int32_t y, uint8_t* target) {
   const auto width = static_cast<size_t>(alpha.Width());
   const uint8_t* source = target + width;

@@ -2,28 +2,28 @@
 //
 //   offset size  field
 //        0    1  length of the identification text behind the header
-//        1    1  1: there is a colour map
-//        2    1  type: 1 colour-mapped, 2 true colour, 3 grey; 9, 10, 11 the same in run-length packets
-//        3    2  first colour map index
-//        5    2  colour map entries
+//        1    1  1: there is a color map
+//        2    1  type: 1 color-mapped, 2 true color, 3 gray; 9, 10, 11 the same in run-length packets
+//        3    2  first color map index
+//        5    2  color map entries
 //        7    1  bits of an entry: 15, 16, 24 or 32
 //        8    4  two origins, ignored
 //       12    2  width
 //       14    2  height
 //       16    1  bits of a pixel: 8, 15, 16, 24 or 32
 //       17    1  descriptor: low four bits attribute (alpha) bits; 0x10 pixels run from the right, 0x20 rows from the top
-//       18       identification text, colour map, pixels
+//       18       identification text, color map, pixels
 //   end-26   26  footer of version 2: offsets of the extension area and the developer area, "TRUEVISION-XFILE." and 0
 //
-// Pixels of 15 and 16 bits are A RRRRR GGGGG BBBBB, of 24 and 32 bits blue, green, red (alpha); grey ones of 16 bits are
-// grey and alpha. A packet is a byte n and one pixel, repeated n - 127 times (n from 128), or n + 1 pixels as they stand.
+// Pixels of 15 and 16 bits are A RRRRR GGGGG BBBBB, of 24 and 32 bits blue, green, red (alpha); gray ones of 16 bits are
+// gray and alpha. A packet is a byte n and one pixel, repeated n - 127 times (n from 128), or n + 1 pixels as they stand.
 //
 // The reader takes packets that go on in the next row. Attribute bits count as alpha when the descriptor has them and the
 // extension area, where there is one, does not call them useless; an alpha plane without any opacity is taken for unset and
 // dropped, as many programs leave these bits zero.
 //
 // The writer stores uncompressed rows from the bottom up, which every reader takes, with a version 2 footer: up to 8 bits
-// as colour-mapped (greys as grey), 24 bits, 32 with an alpha plane; 16 bits with CreateTarga16.
+// as color-mapped (grays as gray), 24 bits, 32 with an alpha plane; 16 bits with CreateTarga16.
 // Source: Truevision, "TGA File Format Specification, Version 2.0" (1991).
 #include "formats/targa/tga.h"
 
@@ -42,7 +42,7 @@ namespace {
 
 constexpr uint64_t kHeaderSize = 18, kFooterSize = 26;
 constexpr uint8_t kRunLengthType = 8;  // added to a type
-constexpr uint8_t kMapped = 1, kTrueColor = 2, kGrey = 3;
+constexpr uint8_t kMapped = 1, kTrueColor = 2, kGray = 3;
 constexpr uint8_t kFromRight = 0x10, kFromTop = 0x20;
 constexpr uint64_t kAttributeTypeOffset = 494;  // in the extension area
 constexpr uint8_t kUsefulAlpha = 3;             // attribute types below are no alpha
@@ -64,19 +64,19 @@ struct TgaHeader {
   uint64_t MapOffset() const { return kHeaderSize + idLength; }
   uint64_t PixelOffset() const { return MapOffset() + MapSize(); }
   int32_t AttributeBits() const { return descriptor & 15; }
-  // Whether the pixels, or the colours of the map, carry a value that may be alpha.
+  // Whether the pixels, or the colors of the map, carry a value that may be alpha.
   bool HasAttribute() const {
     if (AttributeBits() == 0) return false;
     const int32_t colorBits = type == kMapped ? mapBits : bits;
     return colorBits == 32 || colorBits == 16;
   }
-  bool Indexed() const { return (type == kMapped && !HasAttribute()) || (type == kGrey && bits == 8); }
+  bool Indexed() const { return (type == kMapped && !HasAttribute()) || (type == kGray && bits == 8); }
 };
 
 bool DepthFits(const TgaHeader& header) {
   const auto isColor = [](uint8_t bits) { return bits == 15 || bits == 16 || bits == 24 || bits == 32; };
   if (header.type == kMapped) return header.mapType == 1 && header.bits == 8 && isColor(header.mapBits);
-  if (header.type == kGrey) return header.bits == 8 || header.bits == 16;
+  if (header.type == kGray) return header.bits == 8 || header.bits == 16;
   return isColor(header.bits);
 }
 
@@ -101,7 +101,7 @@ Status ParseHeader(std::span<const uint8_t> file, TgaHeader& header) {
   if (header.mapType > 1) return Status::DamagedFile;
   if (type == 0) return Status::NoImages;
   if (type == 32 || type == 33) return Status::UnsupportedFormat;
-  if (header.type < kMapped || header.type > kGrey || type > 11) return Status::DamagedFile;
+  if (header.type < kMapped || header.type > kGray || type > 11) return Status::DamagedFile;
   if (header.width < 1 || header.height < 1) return Status::DamagedFile;
   return DepthFits(header) ? Status::Ok : Status::UnsupportedFormat;
 }
@@ -112,7 +112,7 @@ struct Color {
 
 uint8_t FiveToEight(uint32_t value) { return static_cast<uint8_t>(value << 3 | value >> 2); }
 
-// One colour of 15 to 32 bits, or a grey of 16.
+// One color of 15 to 32 bits, or a gray of 16.
 Color ColorFrom(const uint8_t* bytes, int32_t bits) {
   if (bits >= 24) return {bytes[0], bytes[1], bytes[2], bits == 32 ? bytes[3] : uint8_t{255}};
   const uint32_t value = static_cast<uint32_t>(bytes[0] | bytes[1] << 8);
@@ -122,7 +122,7 @@ Color ColorFrom(const uint8_t* bytes, int32_t bits) {
 
 using ColorMap = std::array<Color, 256>;
 
-// The map's colours at their indices; entries beyond 255 and those that the file lacks do not count. FileReadError when
+// The map's colors at their indices; entries beyond 255 and those that the file lacks do not count. FileReadError when
 // the map is cut short.
 Status ReadColorMap(std::span<const uint8_t> file, const TgaHeader& header, ColorMap& map) {
   map.fill({0, 0, 0, 255});
@@ -139,7 +139,7 @@ Status ReadColorMap(std::span<const uint8_t> file, const TgaHeader& header, Colo
 }
 
 void DescribePicture(const TgaHeader& header, PictureRecord& picture) {
-  constexpr const char* kNames[] = {"Targa, colour-mapped", "Targa, true colour", "Targa, grey"};
+  constexpr const char* kNames[] = {"Targa, color-mapped", "Targa, true color", "Targa, gray"};
   picture.typeName.AssignCut(kNames[header.type - 1]);
   picture.width = header.width;
   picture.height = header.height;
@@ -152,8 +152,8 @@ void DescribePicture(const TgaHeader& header, PictureRecord& picture) {
 void SetPalette(const TgaHeader& header, const ColorMap& map, Palette& palette) {
   if (!header.Indexed()) {
     MakeDefaultPalette(&palette, nullptr, kDisplayPalette);
-  } else if (header.type == kGrey) {
-    palette = GreyRamp();
+  } else if (header.type == kGray) {
+    palette = GrayRamp();
   } else {
     for (size_t i = 0; i < map.size(); ++i) {
       palette[3 * i] = map[i].red;
@@ -223,7 +223,7 @@ class RowSource {
   std::span<const uint8_t> value_;  // the pixel that a run repeats
 };
 
-// What a row of the file becomes: indices, or colours and alpha (empty without a plane).
+// What a row of the file becomes: indices, or colors and alpha (empty without a plane).
 using RowReader = void (*)(std::span<const uint8_t> source, int32_t width, const ColorMap& map, std::span<uint8_t> row,
                            std::span<uint8_t> alpha);
 
@@ -254,18 +254,18 @@ void ReadMapped(std::span<const uint8_t> source, int32_t width, const ColorMap& 
   ReadColors(width, row, alpha, [&](size_t x) { return map[source[x]]; });
 }
 
-void ReadGreyAlpha(std::span<const uint8_t> source, int32_t width, const ColorMap&, std::span<uint8_t> row,
+void ReadGrayAlpha(std::span<const uint8_t> source, int32_t width, const ColorMap&, std::span<uint8_t> row,
                    std::span<uint8_t> alpha) {
   ReadColors(width, row, alpha, [&](size_t x) {
-    const uint8_t grey = source[2 * x];
-    return Color{grey, grey, grey, source[2 * x + 1]};
+    const uint8_t gray = source[2 * x];
+    return Color{gray, gray, gray, source[2 * x + 1]};
   });
 }
 
 RowReader ChooseRowReader(const TgaHeader& header) {
   if (header.Indexed()) return CopyRow;
   if (header.type == kMapped) return ReadMapped;
-  if (header.type == kGrey) return ReadGreyAlpha;
+  if (header.type == kGray) return ReadGrayAlpha;
   switch (header.bits) {
     case 15: return ReadTrueColor<15>;
     case 16: return ReadTrueColor<16>;
@@ -316,8 +316,8 @@ struct TgaLayout {
 
 TgaLayout ChooseLayout(const PictureRecord& picture) {
   if (picture.image.Bits() <= 8) {
-    const bool isGrey = picture.image.Bits() == 8 && picture.palette == GreyRamp();
-    return {isGrey ? kGrey : kMapped, 8, 0};
+    const bool isGray = picture.image.Bits() == 8 && picture.palette == GrayRamp();
+    return {isGray ? kGray : kMapped, 8, 0};
   }
   const bool alpha = !picture.alpha.Empty();
   if (settings.CreateTarga16 != 0) return {kTrueColor, 16, alpha ? 1 : 0};

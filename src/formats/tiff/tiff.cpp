@@ -2,12 +2,12 @@
 //
 //   "II" or "MM", 42, offset of the first directory (BigTIFF: 43, 8, 0, offset of 8 bytes); a directory is a count, entries
 //   of tag, type, count and value or offset, and the offset of the next one: each is a page.
-//   254 subfile   256 width   257 height   258 bits   259 compression   262 colours   273, 279 strips   277 samples
+//   254 subfile   256 width   257 height   258 bits   259 compression   262 colors   273, 279 strips   277 samples
 //   282, 283, 296 resolution   284 planes   320 palette   322-325 tiles   338 extra samples   339 sample format
 //   700 XMP   34665 EXIF   34675 ICC profile
 //
-// What the reader makes of it: greys and palettes of 1, 2, 4 and 8 bits keep their depth (2 becomes 4), deeper greys become
-// 8 bits, everything else 24 bits, with an alpha plane where an extra sample says that it is alpha; colours that were
+// What the reader makes of it: grays and palettes of 1, 2, 4 and 8 bits keep their depth (2 becomes 4), deeper grays become
+// 8 bits, everything else 24 bits, with an alpha plane where an extra sample says that it is alpha; colors that were
 // multiplied by it are divided again. CMYK is turned into RGB by the usual formula. YCbCr that is not JPEG, CIE L*a*b* and
 // LogLuv come through the library's own conversion. Orientation is not applied here: it travels in the EXIF block, which is
 // gathered from the directories of a camera. XMP, ICC profile, description and resolution travel with the picture as well.
@@ -45,7 +45,7 @@ constexpr uint32_t kMostRowSamples = 1 << 25;  // a row is held as a whole
 enum class TiffRows {
   Direct,   // as the picture stores them
   Nibbles,  // 2-bit values, to become 4-bit ones
-  Grey,     // through bytes, one of them a pixel
+  Gray,     // through bytes, one of them a pixel
   Color,    // through bytes, to blue, green, red and alpha
   Library   // the library's own conversion
 };
@@ -53,14 +53,14 @@ enum class TiffRows {
 struct TiffLayout {
   uint32_t width = 0, height = 0;
   TiffSampleForm form;
-  uint16_t samples = 1, colors = 1;  // of a pixel, and how many of them are colours
+  uint16_t samples = 1, colors = 1;  // of a pixel, and how many of them are colors
   uint16_t photometric = 0, compression = 0;
   bool separate = false;  // each sample has strips or tiles of its own
   bool tiled = false;
   uint32_t bandHeight = 0;  // rows of a strip or tile
   uint32_t tileWidth = 0;
   int alpha = -1;           // the sample that is alpha
-  bool multiplied = false;  // colours were multiplied by alpha
+  bool multiplied = false;  // colors were multiplied by alpha
   TiffRows rows = TiffRows::Library;
   int32_t bitsPerPixel = 24;
 };
@@ -106,7 +106,7 @@ void ChooseRows(TiffLayout& layout) {
     layout.rows = bits == 2 ? TiffRows::Nibbles : TiffRows::Direct;
     layout.bitsPerPixel = static_cast<int32_t>(bits);
   } else if (layout.colors == 1 && layout.alpha < 0) {
-    layout.rows = TiffRows::Grey;
+    layout.rows = TiffRows::Gray;
     layout.bitsPerPixel = 8;
   } else {
     layout.rows = TiffRows::Color;
@@ -148,7 +148,7 @@ bool FileHoldsPixels(const TiffInput& input, const TiffLayout& layout) {
   return rowBytes <= input.Bytes().size() / layout.height;
 }
 
-// Colours of 16 bits; some programs store 8.
+// Colors of 16 bits; some programs store 8.
 void TakeColors(TIFF* tiff, size_t count, Palette& palette) {
   uint16_t* channels[3] = {};
   if (TIFFGetField(tiff, TIFFTAG_COLORMAP, &channels[0], &channels[1], &channels[2]) == 0) return;
@@ -274,7 +274,7 @@ class TiffConverter {
       }
     } else {
       const uint8_t* samples = AsBytes(row, planeStride);
-      if (layout_.rows == TiffRows::Grey) {
+      if (layout_.rows == TiffRows::Gray) {
         for (size_t x = 0; x < width; ++x) image[x] = samples[x * layout_.samples];
       } else {
         StoreColors(samples, image);
@@ -468,7 +468,7 @@ Status ReadBands(TiffInput& input, const TiffLayout& layout, const PictureRecord
   return Status::Ok;
 }
 
-// What only the library can convert comes as one raster of red, green, blue and alpha, colours multiplied by alpha.
+// What only the library can convert comes as one raster of red, green, blue and alpha, colors multiplied by alpha.
 Status ReadThroughLibrary(TiffInput& input, const TiffLayout& layout, PictureRecord& picture, TiffTarget& target) {
   const uint64_t pixels = uint64_t{layout.width} * layout.height;
   if (pixels > limits.packedBlockBytes / 4) return Status::MemoryAllocationError;
@@ -523,7 +523,7 @@ const char* CompressionName(uint16_t compression) {
 }
 
 const char* PhotometricName(uint16_t photometric) {
-  constexpr const char* kNames[] = {"grey, 0 is white", "grey", "RGB", "palette", "mask", "CMYK", "YCbCr", "", "CIE L*a*b*"};
+  constexpr const char* kNames[] = {"gray, 0 is white", "gray", "RGB", "palette", "mask", "CMYK", "YCbCr", "", "CIE L*a*b*"};
   return photometric < std::size(kNames) ? kNames[photometric] : "other";
 }
 

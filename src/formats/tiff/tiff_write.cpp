@@ -1,6 +1,6 @@
 // The TIFF writer: one page, little-endian, in strips compressed as TiffOptions says. Palettes of 1, 4 and 8 bits keep their
-// depth (greys as grey), colours are RGB, with an alpha plane as a separate extra sample. CCITT group 4 takes black and
-// white pictures, JPEG greys of 8 bits and colours without alpha; LZW takes the rest. Resolution is the picture's, else
+// depth (grays as gray), colors are RGB, with an alpha plane as a separate extra sample. CCITT group 4 takes black and
+// white pictures, JPEG grays of 8 bits and colors without alpha; LZW takes the rest. Resolution is the picture's, else
 // TiffResolution. An EXIF block is spread over the file's directories; a thumbnail in it stays behind, as it would be a page.
 #include <algorithm>
 #include <span>
@@ -23,10 +23,10 @@ namespace {
 constexpr uint64_t kStripBytes = 128 * 1024;
 constexpr uint32_t kJpegBlock = 16;  // rows of a strip are a multiple of it
 
-enum class Greys { No, Rising, Falling };
+enum class Grays { No, Rising, Falling };
 
-// Whether the palette is the grey ramp of its depth, from black or from white.
-Greys GreysOf(const PictureRecord& picture) {
+// Whether the palette is the gray ramp of its depth, from black or from white.
+Grays GraysOf(const PictureRecord& picture) {
   const int colors = picture.image.Colors();
   bool rising = colors > 0, falling = colors > 0;
   for (int i = 0; i < 3 * colors; ++i) {
@@ -34,7 +34,7 @@ Greys GreysOf(const PictureRecord& picture) {
     rising = rising && value == level;
     falling = falling && value == (colors - 1 - i / 3) * 255 / (colors - 1);
   }
-  return rising ? Greys::Rising : falling ? Greys::Falling : Greys::No;
+  return rising ? Grays::Rising : falling ? Grays::Falling : Grays::No;
 }
 
 struct TiffPlan {
@@ -45,14 +45,14 @@ struct TiffPlan {
   bool invert = false;   // faxes are black on white
 };
 
-uint16_t CompressionFor(const TiffPlan& plan, Greys greys) {
+uint16_t CompressionFor(const TiffPlan& plan, Grays grays) {
   switch (std::clamp<int32_t>(settings.TiffOptions, choice::kTiffNone, choice::kTiffJpeg)) {
     case choice::kTiffNone: return COMPRESSION_NONE;
     case choice::kTiffPackBits: return COMPRESSION_PACKBITS;
-    case choice::kTiffCcitt: return plan.bits == 1 && greys != Greys::No ? COMPRESSION_CCITTFAX4 : COMPRESSION_LZW;
+    case choice::kTiffCcitt: return plan.bits == 1 && grays != Grays::No ? COMPRESSION_CCITTFAX4 : COMPRESSION_LZW;
     case choice::kTiffDeflate: return COMPRESSION_ADOBE_DEFLATE;
     case choice::kTiffJpeg:
-      return plan.bits == 8 && (plan.samples == 3 || (plan.samples == 1 && greys == Greys::Rising)) ? COMPRESSION_JPEG
+      return plan.bits == 8 && (plan.samples == 3 || (plan.samples == 1 && grays == Grays::Rising)) ? COMPRESSION_JPEG
                                                                                                     : COMPRESSION_LZW;
     default: return COMPRESSION_LZW;
   }
@@ -60,14 +60,14 @@ uint16_t CompressionFor(const TiffPlan& plan, Greys greys) {
 
 TiffPlan MakePlan(const PictureRecord& picture) {
   TiffPlan plan;
-  const Greys greys = GreysOf(picture);
+  const Grays grays = GraysOf(picture);
   const bool color = picture.image.Bits() == 24;
   plan.bits = static_cast<uint16_t>(color ? 8 : picture.image.Bits());
   plan.samples = static_cast<uint16_t>(!color ? 1 : picture.alpha.Empty() ? 3 : 4);
-  plan.compression = CompressionFor(plan, greys);
+  plan.compression = CompressionFor(plan, grays);
   if (!color) {
-    plan.photometric = greys == Greys::Rising    ? PHOTOMETRIC_MINISBLACK
-                       : greys == Greys::Falling ? PHOTOMETRIC_MINISWHITE
+    plan.photometric = grays == Grays::Rising    ? PHOTOMETRIC_MINISBLACK
+                       : grays == Grays::Falling ? PHOTOMETRIC_MINISWHITE
                                                  : PHOTOMETRIC_PALETTE;
   }
   if (plan.compression == COMPRESSION_CCITTFAX4) {

@@ -270,7 +270,7 @@ struct PictureDeleter {
   void operator()(WebPPicture* picture) const { WebPPictureFree(picture); }
 };
 
-// The colour of each pixel as blue, green, red, alpha.
+// The color of each pixel as blue, green, red, alpha.
 void FillRow(const PictureRecord& picture, int32_t y, uint32_t* target) {
   const PackedImage& image = picture.image;
   const uint8_t* row = image.Row(y).data();

@@ -58,7 +58,7 @@ struct ExifWordList {
 
 // What the editor may do with a tag.
 inline constexpr uint8_t kExifOrdinary = 0;
-inline constexpr uint8_t kExifStructural = 1;  // sizes, strips, offsets, colour layout: shown, not edited
+inline constexpr uint8_t kExifStructural = 1;  // sizes, strips, offsets, color layout: shown, not edited
 inline constexpr uint8_t kExifVersion = 2;
 inline constexpr uint8_t kExifOpaque = 7;  // pointers, maker notes, patterns
 

@@ -9,7 +9,7 @@ constexpr uint32_t kLowBits = 8 - kCellBits;
 constexpr uint32_t kLowMask = (1 << kLowBits) - 1;
 constexpr uint32_t kCellMask = (1 << kCellBits) - 1;
 
-constexpr uint32_t kSlotBits = 17;  // twice as many slots as colours
+constexpr uint32_t kSlotBits = 17;  // twice as many slots as colors
 static_assert(ColorCounts::kMostColors * 2 == 1 << kSlotBits);
 
 }  // namespace

@@ -8,13 +8,13 @@
 
 namespace fotomill {
 
-// A group of similar colours: their mean and how many pixels have one of them.
+// A group of similar colors: their mean and how many pixels have one of them.
 struct ColorBin {
   float channel[3];  // blue, green, red, 0 to 255
   float weight;      // pixels
 };
 
-// Gathers the colours of a picture into 64 x 64 x 64 cells.
+// Gathers the colors of a picture into 64 x 64 x 64 cells.
 class ColorCells {
  public:
   Status Open();  // MemoryAllocationError
@@ -31,7 +31,7 @@ class ColorCells {
   platform::MemoryBlock cells_;
 };
 
-// Counts each colour of a picture on its own: for pictures of at most kMostColors colours; others are left out.
+// Counts each color of a picture on its own: for pictures of at most kMostColors colors; others are left out.
 class ColorCounts {
  public:
   static constexpr uint32_t kMostColors = 65536;

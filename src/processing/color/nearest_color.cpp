@@ -16,12 +16,12 @@ int32_t Distance(const Point& a, const Point& b) {
   return sum;
 }
 
-// From `count` colours picks those that can be nearest to a point of the cell of `width` levels whose lowest corner is
+// From `count` colors picks those that can be nearest to a point of the cell of `width` levels whose lowest corner is
 // `corner`, the one nearest to its middle first. Returns their number.
 //
-// Whether colour j beats colour m at a point depends on the difference of the two distances, which is linear in the
+// Whether color j beats color m at a point depends on the difference of the two distances, which is linear in the
 // point: at its most favourable corner it is the middle's difference less twice the weighed half width per channel
-// times how far the two colours lie apart there.
+// times how far the two colors lie apart there.
 int32_t PickCandidates(const ColorPoints& points, const uint8_t* from, int32_t count, const Point& corner, int32_t width,
                        uint8_t* picked) {
   const int32_t half = (width - 1) * ColorPoints::kUnits / 2;
@@ -80,7 +80,7 @@ void NearestColor::SetColors(const ColorPoints& points) {
   points_ = points;
   coarseKnown_.fill(false);
   if (fine_ != nullptr) std::memset(fineBlock_.Data(), 0xff, fineBlock_.Bytes().size());
-  groupsUsed_ = 1;  // place 0 would look like a single colour
+  groupsUsed_ = 1;  // place 0 would look like a single color
   const Palette palette = PaletteOf(points);
   for (size_t i = 0; i < 256; ++i) {
     for (size_t c = 0; c < 3; ++c) levels_[i][c] = palette[3 * i + 2 - c];
@@ -123,7 +123,7 @@ uint32_t NearestColor::FillFine(uint32_t cell) {
   return fine_[cell] = list[0] | (count > 1 ? StoreGroups(list, (static_cast<uint32_t>(count) + 3) / 4) << 8 : 0);
 }
 
-// Stores a list of colours in groups of four and returns its place, 0 when there is no room.
+// Stores a list of colors in groups of four and returns its place, 0 when there is no room.
 uint32_t NearestColor::StoreGroups(const uint8_t* list, uint32_t groups) {
   const uint32_t place = groupsUsed_;
   if (place + groups > kMostGroups) return 0;

@@ -11,14 +11,14 @@
 
 namespace fotomill {
 
-// Colours that need not be whole: blue, green and red in sixteenths of a level.
+// Colors that need not be whole: blue, green and red in sixteenths of a level.
 struct ColorPoints {
   static constexpr int32_t kUnits = 16;  // of a level
   int32_t count = 0;
   std::array<std::array<int32_t, 3>, 256> channel{};
 };
 
-// Points from the first `count` colours of a palette, and back, rounded.
+// Points from the first `count` colors of a palette, and back, rounded.
 ColorPoints PointsOf(const Palette& palette, int32_t count);
 Palette PaletteOf(const ColorPoints& points);
 
@@ -26,35 +26,35 @@ Palette PaletteOf(const ColorPoints& points);
 // errors stay small as well.
 inline constexpr int32_t kChannelWeight[3] = {5, 10, 7};
 
-// Answers which of up to 256 colours is nearest to a given one, exactly. The cube of colours is divided into cells
-// of 16 levels, and those into cells of 4; each keeps the few colours that can be nearest to anything in it, worked out
+// Answers which of up to 256 colors is nearest to a given one, exactly. The cube of colors is divided into cells
+// of 16 levels, and those into cells of 4; each keeps the few colors that can be nearest to anything in it, worked out
 // when the cell is first asked for.
 class NearestColor {
  public:
   // Where only FindPoint is wanted, the fine cells are left out. MemoryAllocationError.
   Status Open(bool fine);
-  // The colours to choose from from now on, at least one. Find takes them in whole levels.
+  // The colors to choose from from now on, at least one. Find takes them in whole levels.
   void SetColors(const ColorPoints& points);
 
-  // The colour nearest to blue, green, red, 0 to 255.
+  // The color nearest to blue, green, red, 0 to 255.
   uint8_t Find(int32_t blue, int32_t green, int32_t red) {
     const uint32_t cell = static_cast<uint32_t>((red >> 2) << 12 | (green >> 2) << 6 | blue >> 2);
     const uint32_t known = fine_[cell] != kUnknown ? fine_[cell] : FillFine(cell);
     return known < 256 ? static_cast<uint8_t>(known) : Search(blue, green, red, known >> 8);
   }
-  // The colour nearest to a point.
+  // The color nearest to a point.
   uint8_t FindPoint(const std::array<int32_t, 3>& point);
-  // A colour in whole levels.
+  // A color in whole levels.
   const int16_t* ColorOf(uint8_t index) const { return levels_[index]; }
 
  private:
   static constexpr uint32_t kUnknown = 0xffffffff;
-  static constexpr uint32_t kMostGroups = 200'000;  // 16 MB; beyond, cells do with their middle's nearest colour
+  static constexpr uint32_t kMostGroups = 200'000;  // 16 MB; beyond, cells do with their middle's nearest color
   static constexpr size_t kCoarseList = 257;        // a count, less one, and as many indices
 
-  // Four colours of a fine cell's list. A colour's squared distance from a point, less what all colours have in common
-  // there, is linear in the point: constant - factor x channel. Four times that, with the colour's place in the group
-  // added, is a whole number below 2^24, so the least one, exact in a float, names the nearest colour.
+  // Four colors of a fine cell's list. A color's squared distance from a point, less what all colors have in common
+  // there, is linear in the point: constant - factor x channel. Four times that, with the color's place in the group
+  // added, is a whole number below 2^24, so the least one, exact in a float, names the nearest color.
   struct Group {
     using Four [[gnu::vector_size(16)]] = float;
     Four factor[3], constant;

@@ -13,7 +13,7 @@ namespace fotomill {
 namespace {
 
 constexpr double kLeftToFilter = 4;      // a reduction by twice as much or more is begun by averaging blocks of pixels
-constexpr int32_t kMostByteShift = 20;   // precision of the weights for whole grey levels
+constexpr int32_t kMostByteShift = 20;   // precision of the weights for whole gray levels
 constexpr int32_t kMostShortShift = 15;  // and for samples: sums stay below 2^31
 
 // How the pixels along an edge are averaged: in blocks of `block`, of which the first begins `overhang` pixels before
@@ -109,7 +109,7 @@ class SampleSource {
   platform::MemoryBlock wide_, sums_;
 };
 
-// Divides the colours by their alpha again. A pixel that nothing is seen of is black.
+// Divides the colors by their alpha again. A pixel that nothing is seen of is black.
 void SplitAlpha(const int16_t* pixels, int32_t width, uint8_t* bgr, uint8_t* alpha) {
   for (int32_t x = 0; x < width; ++x, pixels += 4, bgr += 3) {
     const int32_t level = std::clamp((pixels[3] + (1 << (kFraction - 1))) >> kFraction, 0, 255);

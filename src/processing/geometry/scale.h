@@ -30,7 +30,7 @@ enum class ScaleFilter {
 // The filter that a value of the keys ResizeFilter and ThumbnailZoomFilter selects; beyond the list, its nearest entry.
 ScaleFilter ScaleFilterFromKey(int32_t value);
 
-// Scales by picking the source pixel under the middle of each new one. An image keeps its depth and colours; an alpha
+// Scales by picking the source pixel under the middle of each new one. An image keeps its depth and colors; an alpha
 // plane is an image like any other. Statuses as NewPackedImage.
 Status ScaleNearest(const PackedImage& image, Size size, PackedImage& scaled);
 
@@ -39,7 +39,7 @@ Status ScaleNearest(const PackedImage& image, Size size, PackedImage& scaled);
 Status ScalePictureByPercentage(PictureRecord& picture, int32_t percentage);
 
 // The filtered scaler. Where the picture shrinks, the filter widens with it, so that every source pixel counts; windows
-// are cut at the picture's edges; a pixel's colour counts by its alpha. `alpha` may be empty, else it has the image's
+// are cut at the picture's edges; a pixel's color counts by its alpha. `alpha` may be empty, else it has the image's
 // size. The result has 24 bits (with Nearest the image's own depth) and an alpha plane when there was one. Shrinking by
 // 8 and more averages whole blocks of pixels first, so that a fourfold to eightfold reduction is left to the filter.
 // Re-entrant; the same on every processor. Statuses as NewPackedImage; on failure the results are empty.

@@ -43,15 +43,15 @@ void OrderRow(const uint8_t* bgr, int32_t width, int32_t y, int32_t spread, Near
   }
 }
 
-void OrderGreyRow(const uint8_t* grey, int32_t width, int32_t y, uint8_t* indices) {
+void OrderGrayRow(const uint8_t* gray, int32_t width, int32_t y, uint8_t* indices) {
   // The 65 shades of the pattern lie evenly between black and white: 0 is never white, 255 always is.
   int32_t limits[8];
   for (size_t i = 0; i < 8; ++i) limits[i] = (2 * kPattern[static_cast<size_t>(y & 7)][i] + 1) * 255 / 128 + 1;
-  for (int32_t x = 0; x < width; ++x) indices[x] = grey[x] >= limits[x & 7];
+  for (int32_t x = 0; x < width; ++x) indices[x] = gray[x] >= limits[x & 7];
 }
 
-void CutGreyRow(const uint8_t* grey, int32_t width, int32_t threshold, uint8_t* indices) {
-  for (int32_t x = 0; x < width; ++x) indices[x] = grey[x] >= threshold;
+void CutGrayRow(const uint8_t* gray, int32_t width, int32_t threshold, uint8_t* indices) {
+  for (int32_t x = 0; x < width; ++x) indices[x] = gray[x] >= threshold;
 }
 
 Status ErrorDiffuser::Open(int32_t width, bool serpentine, int32_t handedOn) {
@@ -70,8 +70,8 @@ void ErrorDiffuser::Row(const uint8_t* bgr, NearestColor& nearest, uint8_t* indi
   backwards_ = serpentine_ && !backwards_;
 }
 
-void ErrorDiffuser::GreyRow(const uint8_t* grey, uint8_t* indices) {
-  backwards_ ? DiffuseGreyRow<-1>(grey, indices) : DiffuseGreyRow<1>(grey, indices);
+void ErrorDiffuser::GrayRow(const uint8_t* gray, uint8_t* indices) {
+  backwards_ ? DiffuseGrayRow<-1>(gray, indices) : DiffuseGrayRow<1>(gray, indices);
   backwards_ = serpentine_ && !backwards_;
 }
 
@@ -101,11 +101,11 @@ void ErrorDiffuser::DiffuseRow(const uint8_t* bgr, NearestColor& nearest, uint8_
 }
 
 template <int step>
-void ErrorDiffuser::DiffuseGreyRow(const uint8_t* grey, uint8_t* indices) {
+void ErrorDiffuser::DiffuseGrayRow(const uint8_t* gray, uint8_t* indices) {
   int32_t ahead = 0, belowLast = 0, belowHere = 0;
   int32_t x = step > 0 ? 0 : width_ - 1;
   for (int32_t left = width_; left > 0; --left, x += step) {
-    const int32_t wanted = grey[x] + ((ahead + below_[x] + 128) >> 8);
+    const int32_t wanted = gray[x] + ((ahead + below_[x] + 128) >> 8);
     const bool white = wanted >= 128;
     indices[x] = white;
     const int32_t error = handedOn_ * (wanted - (white ? 255 : 0));

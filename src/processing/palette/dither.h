@@ -12,11 +12,11 @@ namespace fotomill {
 // white and 0 for black of a row of brightnesses.
 
 void MapRow(const uint8_t* bgr, int32_t width, NearestColor& nearest, uint8_t* indices);
-// `y` chooses the row of the threshold pattern; `spread` is the distance of two colours that it is to bridge.
+// `y` chooses the row of the threshold pattern; `spread` is the distance of two colors that it is to bridge.
 void OrderRow(const uint8_t* bgr, int32_t width, int32_t y, int32_t spread, NearestColor& nearest, uint8_t* indices);
-void OrderGreyRow(const uint8_t* grey, int32_t width, int32_t y, uint8_t* indices);
+void OrderGrayRow(const uint8_t* gray, int32_t width, int32_t y, uint8_t* indices);
 // White from `threshold` on.
-void CutGreyRow(const uint8_t* grey, int32_t width, int32_t threshold, uint8_t* indices);
+void CutGrayRow(const uint8_t* gray, int32_t width, int32_t threshold, uint8_t* indices);
 
 // Hands each pixel's error on to its neighbours, so it must see all rows from the top down.
 class ErrorDiffuser {
@@ -25,13 +25,13 @@ class ErrorDiffuser {
   // sixteenths of its error. MemoryAllocationError.
   Status Open(int32_t width, bool serpentine, int32_t handedOn);
   void Row(const uint8_t* bgr, NearestColor& nearest, uint8_t* indices);
-  void GreyRow(const uint8_t* grey, uint8_t* indices);
+  void GrayRow(const uint8_t* gray, uint8_t* indices);
 
  private:
   template <int step>
   void DiffuseRow(const uint8_t* bgr, NearestColor& nearest, uint8_t* indices);
   template <int step>
-  void DiffuseGreyRow(const uint8_t* grey, uint8_t* indices);
+  void DiffuseGrayRow(const uint8_t* gray, uint8_t* indices);
 
   platform::MemoryBlock errors_;
   int32_t* below_ = nullptr;  // 256ths of a level handed down to each pixel of the next row, a spare pixel on both sides

@@ -12,7 +12,7 @@ namespace {
 
 using Point = std::array<double, 3>;
 
-constexpr int kMostRounds = 12;          // of moving the colours
+constexpr int kMostRounds = 12;          // of moving the colors
 constexpr double kWorthAnother = 0.002;  // least share by which a round must reduce the error
 
 // A run of bins with its mean, and the axis along which it is widest.
@@ -104,14 +104,14 @@ std::vector<Point> CutIntoGroups(std::span<ColorBin> bins, size_t colors) {
   return means;
 }
 
-// A bin as the search for the nearest colour wants it.
+// A bin as the search for the nearest color wants it.
 std::array<int32_t, 3> PointOf(const ColorBin& bin) {
   std::array<int32_t, 3> point;
   for (size_t c = 0; c < 3; ++c) point[c] = static_cast<int32_t>(bin.channel[c] * ColorPoints::kUnits + 0.5f);
   return point;
 }
 
-// One round: every bin goes to the colour nearest to it, then every colour to the mean of its bins. Returns the squared
+// One round: every bin goes to the color nearest to it, then every color to the mean of its bins. Returns the squared
 // error before the move.
 double MoveToMeans(std::span<const ColorBin> bins, NearestColor& nearest, ColorPoints& points) {
   struct Sum {

@@ -9,16 +9,16 @@
 
 namespace fotomill {
 
-// Finds at most `colors` (1 to 256) colours that stand for the bins with the least squared error: groups are cut in two
+// Finds at most `colors` (1 to 256) colors that stand for the bins with the least squared error: groups are cut in two
 // across their longest axis, the worst group first (Orchard and Bouman 1991), then all are moved to the middle of the
 // bins nearest to them, over and over (Lloyd 1982). MemoryAllocationError.
 Status FitPalette(const std::vector<ColorBin>& bins, int32_t colors, ColorPoints& points);
 
-// Sums of the pixels that took each colour.
+// Sums of the pixels that took each color.
 class ColorMeans {
  public:
   void AddRow(const uint8_t* bgr, const uint8_t* indices, int32_t width);
-  // Moves each colour to the mean of its pixels; one that no pixel took stays.
+  // Moves each color to the mean of its pixels; one that no pixel took stays.
   void Move(ColorPoints& points) const;
 
  private:

@@ -17,45 +17,45 @@ namespace fotomill {
 namespace {
 
 constexpr int32_t kWhole = 100;              // per cent
-constexpr int kRefinements = 3;              // rounds in which the pixels themselves move the palette's colours
+constexpr int kRefinements = 3;              // rounds in which the pixels themselves move the palette's colors
 constexpr int64_t kRefinedPixels = 200'000;  // about as many pixels take part
-constexpr int32_t kFewCells = 1024;          // a picture of fewer cells of colours has its colours counted one by one
+constexpr int32_t kFewCells = 1024;          // a picture of fewer cells of colors has its colors counted one by one
 
 // Sixteenths of its error that a pixel hands on. All of it keeps the mean of black and white. A palette that was fitted
-// to the picture does not reach its outermost colours, and errors that it can never make up for would grow into noise;
-// less is handed on there, the less the closer the colours lie.
+// to the picture does not reach its outermost colors, and errors that it can never make up for would grow into noise;
+// less is handed on there, the less the closer the colors lie.
 constexpr int32_t kHandedOnMono = 16, kHandedOnFew = 12, kHandedOnMany = 10;
-constexpr int32_t kFew = 16;  // colours
+constexpr int32_t kFew = 16;  // colors
 
-// Brightness 0 to 255 (ITU-R BT.601); of a grey it is the grey itself.
+// Brightness 0 to 255 (ITU-R BT.601); of a gray it is the gray itself.
 constexpr uint8_t Brightness(const uint8_t* bgr) {
   return static_cast<uint8_t>((29 * bgr[0] + 150 * bgr[1] + 77 * bgr[2] + 128) >> 8);
 }
 
-// The rows of a picture as they are to be reduced: 24 bits, adjusted, and grey where wanted.
+// The rows of a picture as they are to be reduced: 24 bits, adjusted, and gray where wanted.
 class SourceRows {
  public:
   Status Open(const PackedImage& image, const ReduceOptions& options) {
     RETURN_IF_BAD(rows_.Open(image));
     width_ = image.Width();
-    greys_ = options.greys;
+    grays_ = options.grays;
     adjusted_ = options.brightness != 0 || options.contrast != 0;
     for (int32_t i = 0; i < 256; ++i) {
       const int32_t spread = (2 * i - 255) * (kWhole + options.contrast) / (2 * kWhole);
       levels_[static_cast<size_t>(i)] =
           static_cast<uint8_t>(std::clamp(spread + 128 + options.brightness * 255 / kWhole, 0, 255));
     }
-    if (!adjusted_ && !greys_) return Status::Ok;
+    if (!adjusted_ && !grays_) return Status::Ok;
     return row_.Allocate(3 * static_cast<uint64_t>(width_)) ? Status::Ok : Status::MemoryAllocationError;
   }
 
   const uint8_t* Row(int32_t y) {
     const uint8_t* source = rows_.Row(y);
-    if (!adjusted_ && !greys_) return source;
+    if (!adjusted_ && !grays_) return source;
     uint8_t* row = row_.Data();
     const size_t bytes = 3 * static_cast<size_t>(width_);
     for (size_t i = 0; i < bytes; ++i) row[i] = adjusted_ ? levels_[source[i]] : source[i];
-    for (size_t i = 0; greys_ && i < bytes; i += 3) row[i] = row[i + 1] = row[i + 2] = Brightness(row + i);
+    for (size_t i = 0; grays_ && i < bytes; i += 3) row[i] = row[i + 1] = row[i + 2] = Brightness(row + i);
     return row;
   }
 
@@ -67,7 +67,7 @@ class SourceRows {
  private:
   BgrRows rows_;
   int32_t width_ = 0;
-  bool greys_ = false, adjusted_ = false;
+  bool grays_ = false, adjusted_ = false;
   std::array<uint8_t, 256> levels_{};
   platform::MemoryBlock row_;
 };
@@ -95,7 +95,7 @@ int32_t BestThreshold(const std::array<uint64_t, 256>& counts) {
   return threshold;
 }
 
-// The usual distance between a colour and the one nearest to it, which an ordered pattern has to bridge.
+// The usual distance between a color and the one nearest to it, which an ordered pattern has to bridge.
 int32_t PaletteSpacing(const Palette& palette, int32_t count) {
   double sum = 0;
   for (int32_t i = 0; i < count; ++i) {
@@ -113,7 +113,7 @@ int32_t PaletteSpacing(const Palette& palette, int32_t count) {
   return static_cast<int32_t>(sum / count);
 }
 
-Palette EvenGreys(int32_t count) {
+Palette EvenGrays(int32_t count) {
   Palette palette{};
   for (int32_t i = 0; i < count; ++i) {
     const auto level = static_cast<uint8_t>((i * 255 + (count - 1) / 2) / (count - 1));
@@ -149,25 +149,25 @@ struct Reduction {
 
 Status ReduceToMono(Reduction& work) {
   const int32_t width = work.Width(), height = work.Height();
-  platform::MemoryBlock grey;
-  if (!grey.Allocate(static_cast<uint64_t>(width), platform::Fill::Unset)) return Status::MemoryAllocationError;
+  platform::MemoryBlock gray;
+  if (!gray.Allocate(static_cast<uint64_t>(width), platform::Fill::Unset)) return Status::MemoryAllocationError;
   ErrorDiffuser diffuser;
   RETURN_IF_BAD(diffuser.Open(width, work.options.serpentine, kHandedOnMono));
   int32_t threshold = work.options.threshold;
   if (work.options.monoDither == Dither::None && threshold == 0) {
     std::array<uint64_t, 256> counts{};
     for (int32_t y = 0; y < height; ++y) {
-      work.source.BrightnessRow(y, grey.Data());
-      for (const uint8_t level : grey.Bytes()) ++counts[level];
+      work.source.BrightnessRow(y, gray.Data());
+      for (const uint8_t level : gray.Bytes()) ++counts[level];
     }
     threshold = BestThreshold(counts);
   }
   for (int32_t y = 0; y < height; ++y) {
-    work.source.BrightnessRow(y, grey.Data());
+    work.source.BrightnessRow(y, gray.Data());
     switch (work.options.monoDither) {
-      case Dither::None: CutGreyRow(grey.Data(), width, threshold, work.indices.Data()); break;
-      case Dither::Ordered: OrderGreyRow(grey.Data(), width, y, work.indices.Data()); break;
-      case Dither::FloydSteinberg: diffuser.GreyRow(grey.Data(), work.indices.Data()); break;
+      case Dither::None: CutGrayRow(gray.Data(), width, threshold, work.indices.Data()); break;
+      case Dither::Ordered: OrderGrayRow(gray.Data(), width, y, work.indices.Data()); break;
+      case Dither::FloydSteinberg: diffuser.GrayRow(gray.Data(), work.indices.Data()); break;
     }
     work.StoreRow(y);
   }
@@ -183,7 +183,7 @@ Status GatherColors(Reduction& work, std::vector<ColorBin>& bins) {
   return Status::Ok;
 }
 
-// Takes the pixels themselves to the colours nearest to them, and the colours to their means.
+// Takes the pixels themselves to the colors nearest to them, and the colors to their means.
 Status RefineOnPixels(Reduction& work, NearestColor& nearest, ColorPoints& points) {
   const int64_t pixels = static_cast<int64_t>(work.Width()) * work.Height();
   const auto step = static_cast<int32_t>(pixels / kRefinedPixels + 1);
@@ -200,14 +200,14 @@ Status RefineOnPixels(Reduction& work, NearestColor& nearest, ColorPoints& point
   return Status::Ok;
 }
 
-// Puts the palette for more than two colours into `work`, and its colours into `nearest`.
+// Puts the palette for more than two colors into `work`, and its colors into `nearest`.
 Status ChoosePalette(Reduction& work, NearestColor& nearest) {
   const int32_t most = 1 << work.bits;
   RETURN_IF_BAD(nearest.Open(true));
   ColorPoints points;
-  if (work.options.greys) {
-    const int32_t count = work.options.greyLevels == 0 ? most : std::min(most, work.options.greyLevels);
-    points = PointsOf(EvenGreys(count), count);
+  if (work.options.grays) {
+    const int32_t count = work.options.grayLevels == 0 ? most : std::min(most, work.options.grayLevels);
+    points = PointsOf(EvenGrays(count), count);
   } else {
     std::vector<ColorBin> bins;
     RETURN_IF_BAD(GatherColors<ColorCells>(work, bins));
@@ -247,8 +247,8 @@ ReduceOptions ReduceOptionsFromSettings() {
   options.colorDither = DitherFromKey(settings.FXColorDither);
   options.monoDither = DitherFromKey(settings.FXMonoDither);
   options.serpentine = settings.FXBidirectional != 0;
-  options.greys = settings.FXMonomode != 0;
-  options.greyLevels = settings.FXGrayLevel <= 0 ? 0 : std::clamp(settings.FXGrayLevel, 2, 256);
+  options.grays = settings.FXMonomode != 0;
+  options.grayLevels = settings.FXGrayLevel <= 0 ? 0 : std::clamp(settings.FXGrayLevel, 2, 256);
   options.threshold = std::clamp(settings.FXThreshold, 0, 255);
   options.brightness = std::clamp(settings.DitherBrightness, -kWhole, kWhole);
   options.contrast = std::clamp(settings.DitherContrast, -kWhole, kWhole);
@@ -262,7 +262,7 @@ Status ReduceColors(PictureRecord& picture, int32_t maxBits, const ReduceOptions
   RETURN_IF_BAD(FlattenAlpha(picture));
   if (picture.image.Bits() <= bits) return Status::Ok;
   bool packed = false;
-  if (!options.greys) RETURN_IF_BAD(PackFewColors(picture, bits, packed));
+  if (!options.grays) RETURN_IF_BAD(PackFewColors(picture, bits, packed));
   if (packed) return Status::Ok;
 
   const ProgressScope progress(picture);
@@ -271,7 +271,7 @@ Status ReduceColors(PictureRecord& picture, int32_t maxBits, const ReduceOptions
   if (!work.indices.Allocate(static_cast<uint64_t>(work.Width()), platform::Fill::Unset)) return Status::MemoryAllocationError;
   NearestColor nearest;
   if (bits == 1) {
-    work.palette = EvenGreys(2);
+    work.palette = EvenGrays(2);
   } else {
     RETURN_IF_BAD(ChoosePalette(work, nearest));
   }

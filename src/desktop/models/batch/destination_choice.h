@@ -20,7 +20,7 @@ std::vector<DestinationFormat> DestinationFormats();
 struct DestinationChoice {
   std::string extension;
   std::string folder;  // empty: beside each source
-  bool reduce = true;  // colours of pictures that are too deep for the format
+  bool reduce = true;  // colors of pictures that are too deep for the format
   bool autoOrient = true;
   bool keepMetadata = true;
 };

@@ -29,7 +29,7 @@ struct ListPalette {
   Shade fault;                   // text about what went wrong, likewise
 };
 
-// From the system's own colours, light or dark.
+// From the system's own colors, light or dark.
 ListPalette PaletteOf(Shade background, Shade text, Shade highlight, Shade highlightText);
 
 }  // namespace fotomill::desktop

@@ -20,13 +20,13 @@ struct RgbImage {
   const uint8_t* Row(int32_t y) const { return bytes.data() + static_cast<size_t>(y) * static_cast<size_t>(width) * 3; }
 };
 
-// An image of `width` by `height` in one colour, 0x00BBGGRR.
+// An image of `width` by `height` in one color, 0x00BBGGRR.
 RgbImage FilledImage(int32_t width, int32_t height, Color color);
 
 // The pixels of a packed image of any depth. Statuses as NewPackedImage.
 Status ToRgb(const PackedImage& image, RgbImage& rgb);
 
-// The same with an alpha plane, on a background of one colour, 0x00BBGGRR.
+// The same with an alpha plane, on a background of one color, 0x00BBGGRR.
 Status ToRgb(const PackedImage& image, const PackedImage& alpha, Color background, RgbImage& rgb);
 
 // And back: a packed image of 24 bits. Statuses as NewPackedImage.
@@ -39,7 +39,7 @@ Status PrepareForDisplay(PictureRecord& picture, Color background);
 // The same without a background: the alpha plane stays, unless the picture is opaque after all.
 Status PrepareWithAlpha(PictureRecord& picture);
 
-// The picture of a thumbnail without the even margins of a colour around it, and at least a pixel of it.
+// The picture of a thumbnail without the even margins of a color around it, and at least a pixel of it.
 RgbImage WithoutMatte(const RgbImage& image, Color matte);
 
 }  // namespace fotomill::desktop

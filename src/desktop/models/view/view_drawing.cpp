@@ -74,7 +74,7 @@ inline uint8_t* DrawPixelBetween(const LineBetween& line, const ColumnPair& at, 
   return rgb;
 }
 
-// The same of pixels with alpha: each colour counts by its alpha, so that what is transparent gives none away.
+// The same of pixels with alpha: each color counts by its alpha, so that what is transparent gives none away.
 uint8_t* BlendPixelBetween(const RowPair& rows, const RowPair& alphas, const ColumnPair& at, const uint8_t* behind,
                            uint8_t* rgb) {
   constexpr uint32_t kWhole = 65536 * 255;  // the weight of what is opaque
@@ -100,21 +100,21 @@ class BetweenPixels {
 
   void Draw(int64_t row, uint8_t* rgb) {
     const int32_t width = source_.image.Width();
-    colours_.Set(RowPair(source_.image, row), columns_, width, 3);
-    for (const int64_t column : columns_) rgb = DrawPixelBetween(colours_, ColumnPair(column, width), rgb);
+    colors_.Set(RowPair(source_.image, row), columns_, width, 3);
+    for (const int64_t column : columns_) rgb = DrawPixelBetween(colors_, ColumnPair(column, width), rgb);
   }
 
   void Blend(int64_t row, const uint8_t* behind, uint8_t* rgb) {
     constexpr uint16_t kOpaque = 255 * 256;
     const int32_t width = source_.image.Width();
     const RowPair rows(source_.image, row), alphaRows(source_.alpha, row);
-    colours_.Set(rows, columns_, width, 3);
+    colors_.Set(rows, columns_, width, 3);
     alphas_.Set(alphaRows, columns_, width, 1);
     for (const int64_t column : columns_) {
       const ColumnPair at(column, width);
       const uint16_t left = *alphas_.At(at.left), right = *alphas_.At(at.right);
       if (left == kOpaque && right == kOpaque) {
-        rgb = DrawPixelBetween(colours_, at, rgb);
+        rgb = DrawPixelBetween(colors_, at, rgb);
       } else if (left == 0 && right == 0) {
         rgb = std::copy_n(behind, 3, rgb);
       } else {
@@ -127,7 +127,7 @@ class BetweenPixels {
  private:
   const ViewSource source_;
   const Positions& columns_;
-  LineBetween colours_, alphas_;
+  LineBetween colors_, alphas_;
 };
 
 void DrawNearest(const uint8_t* bgr, const Positions& columns, uint8_t* rgb) {
@@ -144,7 +144,7 @@ void BlendNearest(const uint8_t* bgr, const uint8_t* alpha, const Positions& col
   }
 }
 
-// Two rows of what is behind a picture: of the lines whose squares begin with the one colour, and with the other.
+// Two rows of what is behind a picture: of the lines whose squares begin with the one color, and with the other.
 class RowsBehind {
  public:
   RowsBehind(const Backdrop& backdrop, int32_t left, int32_t width) : side_(backdrop.squares ? backdrop.side : 1) {

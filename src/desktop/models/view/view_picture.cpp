@@ -8,7 +8,7 @@
 #include "desktop/models/view/photo_facts.h"
 #include "desktop/models/view/view_transform.h"
 #include "platform/clock.h"
-#include "processing/color/colour_transform.h"
+#include "processing/color/color_transform.h"
 #include "processing/geometry/scale.h"
 #include "registry/registry.h"
 #include "settings/settings.h"
@@ -31,11 +31,11 @@ Status Shrink(const PictureRecord& picture, int32_t width, int32_t height, ViewP
 }
 
 // The transform of the profile that this thread met last: pictures of a folder and frames of an animation mostly share theirs.
-const ColourTransform& TransformOf(const std::vector<uint8_t>& profile) {
+const ColorTransform& TransformOf(const std::vector<uint8_t>& profile) {
   thread_local std::vector<uint8_t> last;
-  thread_local std::unique_ptr<ColourTransform> transform;
+  thread_local std::unique_ptr<ColorTransform> transform;
   if (transform == nullptr || profile != last) {
-    transform = std::make_unique<ColourTransform>(profile, screenProfile);
+    transform = std::make_unique<ColorTransform>(profile, screenProfile);
     last = profile;
   }
   return *transform;
@@ -64,7 +64,7 @@ uint64_t ViewPicture::Bytes() const {
 
 Status PrepareView(PicturePointer picture, ViewPicture& view) {
   const ViewWish& wish = view.wish;
-  // Before the background joins in, whose colour is the screen's.
+  // Before the background joins in, whose color is the screen's.
   const bool profiles = !picture->metadata.icc.empty() || !screenProfile.empty();
   if (wish.look.profiles && profiles) TransformOf(picture->metadata.icc).Apply(picture->image);
   if (wish.look.keepAlpha) {
@@ -98,7 +98,7 @@ Status PixelsForOthers(const ViewPicture& view, Color background, RgbImage& pixe
   if (!view.wish.look.profiles || screenProfile.empty()) return Status::Ok;
   PackedImage image;
   RETURN_IF_BAD(ToPacked(pixels, image));
-  ColourTransform(screenProfile).Apply(image);
+  ColorTransform(screenProfile).Apply(image);
   return ToRgb(image, pixels);
 }
 

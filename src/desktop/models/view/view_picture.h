@@ -18,14 +18,14 @@ namespace fotomill::desktop {
 
 // How a picture is to look, whichever it is.
 struct ViewLook {
-  bool profiles = false;   // in the colours that its colour profile means
+  bool profiles = false;   // in the colors that its color profile means
   bool keepAlpha = false;  // with its alpha plane, instead of on ViewModeBackground
 
   static ViewLook FromSettings();
   bool operator==(const ViewLook&) const = default;
 };
 
-// The colour profile of the screen that pictures are made for from here on; empty for sRGB. To be told before the first picture
+// The color profile of the screen that pictures are made for from here on; empty for sRGB. To be told before the first picture
 // is wished for.
 void SetScreenProfile(std::vector<uint8_t> profile);
 
@@ -63,7 +63,7 @@ using ViewPicturePointer = std::shared_ptr<const ViewPicture>;
 // "4000 x 3000 pixels, 3.2 MB, 25%" of a picture at a scale.
 std::string SizeAndZoom(const PictureRecord& picture, double scale);
 
-// A decoded picture's pixels for other programs: on a background, 0x00BBGGRR, and in sRGB whatever the screen's colours are.
+// A decoded picture's pixels for other programs: on a background, 0x00BBGGRR, and in sRGB whatever the screen's colors are.
 Status PixelsForOthers(const ViewPicture& view, Color background, RgbImage& pixels);
 
 // Makes a decoded picture what the wish of `view` asks for. Statuses of PrepareForDisplay.

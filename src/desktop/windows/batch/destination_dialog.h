@@ -16,7 +16,7 @@ class wxStaticText;
 
 namespace fotomill::desktop {
 
-// The destination step of a function: format, folder, and what becomes of colours and metadata.
+// The destination step of a function: format, folder, and what becomes of colors and metadata.
 class DestinationDialog : public wxDialog {
  public:
   // `verb` is what OK does: "Convert".

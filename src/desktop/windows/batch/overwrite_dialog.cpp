@@ -41,7 +41,7 @@ OverwriteDialog::OverwriteDialog(wxWindow* parent, const OverwriteQuestion& ques
   sizer->Add(row, below);
   if (!question.problem.empty()) {
     auto* problem = new wxStaticText(this, wxID_ANY, Shown(question.problem));
-    problem->SetForegroundColour(FaultColour());
+    problem->SetForegroundColour(FaultColor());
     sizer->Add(problem, below);
   }
   if (question.checks.previews) sizer->Add(panes_ = MakePreviews(question, preview), wxSizerFlags(1).Expand().Border(wxALL, gap));

@@ -65,7 +65,7 @@ FolderTree::FolderTree(wxWindow* parent, const Favourites& favourites, Events ev
   Bind(wxEVT_TREE_ITEM_MENU, [this](wxTreeEvent& event) { ShowMenu(event.GetItem(), event.GetPoint()); });
 }
 
-// In the colour of texts.
+// In the color of texts.
 void FolderTree::TakeImages() {
   wxVector<wxBitmapBundle> images;
   for (const char* symbol : {"folder", "home", "favourite", "volume"}) images.push_back(Symbol(symbol));

@@ -82,7 +82,7 @@ void PathBar::BuildEdit() {
 
 void PathBar::ShowFolder(const std::string& folder) {
   folder_ = folder;
-  // A button that goes grey would take the keyboard with it.
+  // A button that goes gray would take the keyboard with it.
   if ((back_->HasFocus() && !trail_.CanStep(-1)) || (forward_->HasFocus() && !trail_.CanStep(1))) events_.left();
   back_->Enable(trail_.CanStep(-1));
   forward_->Enable(trail_.CanStep(1));

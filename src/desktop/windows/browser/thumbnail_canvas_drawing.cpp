@@ -24,7 +24,7 @@ constexpr size_t kMostCutNames = 5000;
 
 }  // namespace
 
-// The colours of one painting.
+// The colors of one painting.
 struct ThumbnailCanvas::Looks {
   ListPalette palette = CurrentPalette();
   wxColour background = ToWx(palette.background), text = ToWx(palette.text);

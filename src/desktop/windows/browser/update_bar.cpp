@@ -16,9 +16,9 @@ namespace fotomill::desktop {
 UpdateBar::UpdateBar(wxWindow* parent, std::function<void(int32_t choice)> answered)
     : wxPanel(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTAB_TRAVERSAL | wxBORDER_NONE, "UpdateThumbnailsBox"),
       answered_(std::move(answered)) {
-  SetBackgroundColour(BarColour());
+  SetBackgroundColour(BarColor());
   Bind(wxEVT_SYS_COLOUR_CHANGED, [this](wxSysColourChangedEvent& event) {
-    SetBackgroundColour(BarColour());
+    SetBackgroundColour(BarColor());
     event.Skip();
   });
   const int gap = FromDIP(6);

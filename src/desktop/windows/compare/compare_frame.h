@@ -39,7 +39,7 @@ class CompareFrame : public wxFrame {
  private:
   struct Pane {
     std::string path;
-    wxPanel* panel;  // its colour is a frame around the pane with the focus
+    wxPanel* panel;  // its color is a frame around the pane with the focus
     ViewCanvas* canvas;
     wxStaticText* caption;
   };

@@ -9,7 +9,7 @@
 #include "core/shown_text.h"
 #include "core/whole_number.h"
 #include "desktop/windows/browser/mask_list.h"
-#include "desktop/windows/setup/colour_button.h"
+#include "desktop/windows/setup/color_button.h"
 #include "desktop/windows/shell/wx_text.h"
 #include "registry/registry.h"
 
@@ -75,12 +75,12 @@ void BoundControls::SetRange(uint32_t control, const SpinRange& range) {
   spin->SetIncrement(range.step);
 }
 
-void BoundControls::SetColour(uint32_t control, int32_t colour) {
-  if (auto* button = dynamic_cast<ColourButton*>(Find(control))) button->SetSetting(colour);
+void BoundControls::SetColour(uint32_t control, int32_t color) {
+  if (auto* button = dynamic_cast<ColorButton*>(Find(control))) button->SetSetting(color);
 }
 
-int32_t BoundControls::Colour(uint32_t control) const {
-  const auto* button = dynamic_cast<const ColourButton*>(Find(control));
+int32_t BoundControls::Color(uint32_t control) const {
+  const auto* button = dynamic_cast<const ColorButton*>(Find(control));
   return button == nullptr ? 0 : button->Setting();
 }
 

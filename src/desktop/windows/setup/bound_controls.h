@@ -22,8 +22,8 @@ class BoundControls : public SetupDialog {
   std::string Text(uint32_t control) const override;
   void LimitText(uint32_t control, size_t bytes) override;
   void SetRange(uint32_t control, const SpinRange& range) override;
-  void SetColour(uint32_t control, int32_t colour) override;
-  int32_t Colour(uint32_t control) const override;
+  void SetColour(uint32_t control, int32_t color) override;
+  int32_t Color(uint32_t control) const override;
   void SetChoices(uint32_t control, std::span<const std::string> texts) override;
   void Select(uint32_t control, int32_t position) override;
   int32_t Selected(uint32_t control) const override;

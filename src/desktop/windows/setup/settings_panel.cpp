@@ -14,7 +14,7 @@
 #include "catalog/history/file_history.h"
 #include "desktop/models/setup/setup_help.h"
 #include "desktop/windows/browser/mask_list.h"
-#include "desktop/windows/setup/colour_button.h"
+#include "desktop/windows/setup/color_button.h"
 #include "desktop/windows/shell/help.h"
 #include "desktop/windows/shell/wx_text.h"
 
@@ -57,7 +57,7 @@ wxWindow* MakeControl(wxWindow* box, const SetupItem& item) {
   if ((row.type & KEY_FLAG) != 0) return new wxCheckBox(box, id, label);
   if (IsFunctionMask(item.key)) return new MaskList(box, id, FunctionNames());
   if ((row.type & KEY_CHOICE) != 0) return new wxChoice(box, id);
-  if ((row.type & KEY_COLOUR) != 0) return new ColourButton(box, id, label);
+  if ((row.type & KEY_COLOR) != 0) return new ColorButton(box, id, label);
   if ((row.type & KEY_SPIN) != 0) return MakeSpin(box, row, id);
   return new wxTextCtrl(box, id);
 }

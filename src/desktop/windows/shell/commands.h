@@ -9,7 +9,7 @@ namespace fotomill::desktop {
 
 class MainFrame;
 
-// When a command can be used; where it cannot, its menu item and button are grey.
+// When a command can be used; where it cannot, its menu item and button are gray.
 enum class Needs {
   Nothing,
   Files,  // at least one file selected or focused

@@ -10,8 +10,8 @@ namespace fotomill::desktop {
 namespace {
 
 Shade SystemShade(wxSystemColour index) {
-  const wxColour colour = wxSystemSettings::GetColour(index);
-  return {colour.Red(), colour.Green(), colour.Blue()};
+  const wxColour color = wxSystemSettings::GetColour(index);
+  return {color.Red(), color.Green(), color.Blue()};
 }
 
 }  // namespace
@@ -21,7 +21,7 @@ ListPalette CurrentPalette() {
                    SystemShade(wxSYS_COLOUR_HIGHLIGHTTEXT));
 }
 
-wxColour FaultColour() {
+wxColour FaultColor() {
   const Shade window = SystemShade(wxSYS_COLOUR_BTNFACE);
   return ToWx(PaletteOf(window, SystemShade(wxSYS_COLOUR_BTNTEXT), window, window).fault);
 }
@@ -35,6 +35,6 @@ int TextWidth(const wxWindow& window, int width) {
   return static_cast<int>(std::lround(window.FromDIP(width) * TextScale(window)));
 }
 
-wxColour BarColour() { return ToWx(Blend(SystemShade(wxSYS_COLOUR_WINDOW), SystemShade(wxSYS_COLOUR_HIGHLIGHT), 1.0 / 7)); }
+wxColour BarColor() { return ToWx(Blend(SystemShade(wxSYS_COLOUR_WINDOW), SystemShade(wxSYS_COLOUR_HIGHLIGHT), 1.0 / 7)); }
 
 }  // namespace fotomill::desktop

@@ -7,12 +7,12 @@
 
 namespace fotomill::desktop {
 
-// The colours of own drawings, from those of the system as they are now.
+// The colors of own drawings, from those of the system as they are now.
 ListPalette CurrentPalette();
 // Of texts about what went wrong, in a window among the system's controls.
-wxColour FaultColour();
+wxColour FaultColor();
 // Of a bar that stands out of its window a little.
-wxColour BarColour();
+wxColour BarColor();
 
 // How much larger texts are than usual, at least 1.
 double TextScale(const wxWindow& window);

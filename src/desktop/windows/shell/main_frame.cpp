@@ -143,10 +143,10 @@ void MainFrame::BuildMenus() {
 void MainFrame::BuildToolbar() {
   CreateToolBar(wxTB_FLAT | wxTB_HORIZONTAL | wxTB_TEXT | wxTB_NODIVIDER, wxID_ANY, "Functions");
   FillToolbar();
-  // Symbols are in the colour of texts.
+  // Symbols are in the color of texts.
   Bind(wxEVT_SYS_COLOUR_CHANGED, [this](wxSysColourChangedEvent& event) {
     FillToolbar();
-    LogEvent("colours", "changed");
+    LogEvent("colors", "changed");
     event.Skip();
   });
 }
@@ -171,7 +171,7 @@ void MainFrame::ChooseToolbar() {
   if (AskForToolbar(*this)) FillToolbar();
 }
 
-// The tip of a button that is grey says why.
+// The tip of a button that is gray says why.
 void MainFrame::ShowTip(const Command& command) {
   const wxString key = *command.accelerator == '\0' ? wxString() : wxString(" (") + command.accelerator + ")";
   const wxString tip = command.help + key + (Enabled(command) ? wxString() : wxString("\n") + WhatIsMissing(command.needs));

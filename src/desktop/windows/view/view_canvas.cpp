@@ -26,7 +26,7 @@ constexpr int kSquareSide = 8;        // of the checkerboard
 constexpr Color kLightSquares[] = {0xffffff, 0xcccccc};
 constexpr Color kDarkSquares[] = {0x666666, 0x444444};
 
-wxColour ColourOf(int32_t color) {
+wxColour ColorOf(int32_t color) {
   return {static_cast<unsigned char>(color), static_cast<unsigned char>(color >> 8), static_cast<unsigned char>(color >> 16)};
 }
 
@@ -206,7 +206,7 @@ Backdrop ViewCanvas::BackdropHere() const {
 }
 
 void ViewCanvas::PaintMessage(wxDC& dc) const {
-  const wxColour around = ColourOf(settings.ViewModeBackground);
+  const wxColour around = ColorOf(settings.ViewModeBackground);
   dc.SetBackground(wxBrush(around));
   dc.Clear();
   if (picture_ == nullptr) return;

@@ -1,4 +1,4 @@
-#include "processing/color/colour_transform.h"
+#include "processing/color/color_transform.h"
 
 #include <gtest/gtest.h>
 #include <lcms2.h>
@@ -32,7 +32,7 @@ std::vector<uint8_t> WideProfile() {
   return bytes;
 }
 
-std::vector<uint8_t> GreyProfile(double gamma) {
+std::vector<uint8_t> GrayProfile(double gamma) {
   cmsToneCurve* const curve = cmsBuildGamma(nullptr, gamma);
   const auto bytes = Saved(cmsCreateGrayProfile(&kDaylight, curve));
   cmsFreeToneCurve(curve);
@@ -44,7 +44,7 @@ double Encoded(double light) {
   return 255 * (light <= 0.0031308 ? 12.92 * light : 1.055 * std::pow(light, 1 / 2.4) - 0.055);
 }
 
-// A wide colour, 0x00RRGGBB, in sRGB: by the two standards' matrices, not by the library.
+// A wide color, 0x00RRGGBB, in sRGB: by the two standards' matrices, not by the library.
 std::array<double, 3> WideInSrgb(uint32_t color) {
   const double r = std::pow((color >> 16) / 255.0, 563.0 / 256), g = std::pow((color >> 8 & 255) / 255.0, 563.0 / 256),
                b = std::pow((color & 255) / 255.0, 563.0 / 256);
@@ -54,9 +54,9 @@ std::array<double, 3> WideInSrgb(uint32_t color) {
           Encoded(0.0556434 * x - 0.2040259 * y + 1.0572252 * z)};
 }
 
-TEST(ColourTransform, BringsWideColoursToTheScreen) {
-  const ColourTransform transform(WideProfile());
-  ASSERT_TRUE(transform.ChangesColours());
+TEST(ColorTransform, BringsWideColorsToTheScreen) {
+  const ColorTransform transform(WideProfile());
+  ASSERT_TRUE(transform.ChangesColors());
   const auto picture = test::MakePicture(1031, 1021, [](int32_t x, int32_t y) { return test::Scatter(x, y) & 0xffffff; });
   const std::vector<uint32_t> before = test::Colors(*picture);
   transform.Apply(picture->image);
@@ -72,24 +72,24 @@ TEST(ColourTransform, BringsWideColoursToTheScreen) {
   small.ColorTable()[1] = 200;
   transform.Apply(small);
   EXPECT_NEAR(small.ColorTable()[1], WideInSrgb(0x00c800)[1], 1);
-  // On a screen of the same colours nothing is to be done; on it, pictures without a profile are those of sRGB.
-  EXPECT_FALSE(ColourTransform(WideProfile(), WideProfile()).ChangesColours());
+  // On a screen of the same colors nothing is to be done; on it, pictures without a profile are those of sRGB.
+  EXPECT_FALSE(ColorTransform(WideProfile(), WideProfile()).ChangesColors());
   PackedImage green;
   ASSERT_EQ(NewPackedImage(1, 1, nullptr, 24, green), Status::Ok);
   green.Row(0)[1] = 255;
-  ColourTransform({}, WideProfile()).Apply(green);
+  ColorTransform({}, WideProfile()).Apply(green);
   EXPECT_NEAR(green.Row(0)[2], 144, 1);  // the red of sRGB's green in Adobe RGB
 }
 
-TEST(ColourTransform, GreyProfilesAreForGreyPictures) {
-  const ColourTransform transform(GreyProfile(1));
-  ASSERT_TRUE(transform.ChangesColours());
+TEST(ColorTransform, GrayProfilesAreForGrayPictures) {
+  const ColorTransform transform(GrayProfile(1));
+  ASSERT_TRUE(transform.ChangesColors());
   const auto picture = test::MakePicture(256, 1, [](int32_t x, int32_t) { return static_cast<uint32_t>(x) * 0x10101; });
   transform.Apply(picture->image);
   for (int32_t x = 0; x < 256; ++x) EXPECT_NEAR(picture->image.PixelAt(x, 0) & 255, Encoded(x / 255.0), 1) << x;
-  const auto coloured = test::MakePicture(2, 1, [](int32_t x, int32_t) { return x == 0 ? 0x404040u : 0x404041u; });
-  transform.Apply(coloured->image);
-  EXPECT_EQ(coloured->image.PixelAt(0, 0), 0x404040);
+  const auto colored = test::MakePicture(2, 1, [](int32_t x, int32_t) { return x == 0 ? 0x404040u : 0x404041u; });
+  transform.Apply(colored->image);
+  EXPECT_EQ(colored->image.PixelAt(0, 0), 0x404040);
 }
 
 // The offset of a tag's entry in the table of tags.
@@ -125,20 +125,20 @@ std::vector<uint8_t> WithEndlessSteps(std::vector<uint8_t> profile) {
   return profile;
 }
 
-TEST(ColourTransform, HostileProfilesDoNoHarm) {
-  EXPECT_FALSE(ColourTransform({}).ChangesColours());
-  EXPECT_FALSE(ColourTransform(Saved(cmsCreate_sRGBProfile())).ChangesColours());
-  EXPECT_FALSE(ColourTransform(Saved(cmsCreateLab4Profile(nullptr))).ChangesColours());
-  EXPECT_FALSE(ColourTransform(Saved(cmsCreateInkLimitingDeviceLink(cmsSigCmykData, 300))).ChangesColours());
+TEST(ColorTransform, HostileProfilesDoNoHarm) {
+  EXPECT_FALSE(ColorTransform({}).ChangesColors());
+  EXPECT_FALSE(ColorTransform(Saved(cmsCreate_sRGBProfile())).ChangesColors());
+  EXPECT_FALSE(ColorTransform(Saved(cmsCreateLab4Profile(nullptr))).ChangesColors());
+  EXPECT_FALSE(ColorTransform(Saved(cmsCreateInkLimitingDeviceLink(cmsSigCmykData, 300))).ChangesColors());
   const std::vector<uint8_t> wide = WideProfile();
-  EXPECT_TRUE(ColourTransform(WithEndlessSteps(wide)).ChangesColours());  // by its other tags, and soon
+  EXPECT_TRUE(ColorTransform(WithEndlessSteps(wide)).ChangesColors());  // by its other tags, and soon
   const auto picture = test::MakePicture(4, 4, [](int32_t x, int32_t y) { return test::Scatter(x, y) & 0xffffff; });
-  for (size_t cut = 0; cut < wide.size(); cut += 7) ColourTransform({wide.data(), cut}).Apply(picture->image);
+  for (size_t cut = 0; cut < wide.size(); cut += 7) ColorTransform({wide.data(), cut}).Apply(picture->image);
   for (size_t place = 0; place < wide.size(); place += 3) {
     std::vector<uint8_t> damaged = wide;
     damaged[place] = static_cast<uint8_t>(damaged[place] ^ (place % 2 == 0 ? 0xff : 0x55));
-    ColourTransform(damaged, wide).Apply(picture->image);
-    ColourTransform(wide, damaged).Apply(picture->image);
+    ColorTransform(damaged, wide).Apply(picture->image);
+    ColorTransform(wide, damaged).Apply(picture->image);
   }
 }
 

@@ -8,24 +8,24 @@
 
 namespace fotomill::desktop {
 
-inline constexpr const char* kColourSelectBox = "COMMONColourSelectBox";
+inline constexpr const char* kColorSelectBox = "COMMONColourSelectBox";
 
 // Asks for a color, beginning with one; both are 0x00BBGGRR. Nothing when the user cancels. Colors that were put aside
 // stay until the program ends.
-std::optional<int32_t> SelectColour(wxWindow* parent, int32_t colour, const wxString& title);
+std::optional<int32_t> SelectColor(wxWindow* parent, int32_t color, const wxString& title);
 
 // A button that shows the color of a setting; a click opens the color selector. Tells a change as a button event of its own
 // id.
-class ColourButton : public wxButton {
+class ColorButton : public wxButton {
  public:
-  ColourButton(wxWindow* parent, wxWindowID id, const wxString& title);
+  ColorButton(wxWindow* parent, wxWindowID id, const wxString& title);
 
-  void SetSetting(int32_t colour);  // 0x00BBGGRR
-  int32_t Setting() const { return colour_; }
+  void SetSetting(int32_t color);  // 0x00BBGGRR
+  int32_t Setting() const { return color_; }
 
  private:
   const wxString title_;
-  int32_t colour_ = 0;
+  int32_t color_ = 0;
 };
 
 }  // namespace fotomill::desktop

@@ -1,4 +1,4 @@
-#include "processing/color/colour_transform.h"
+#include "processing/color/color_transform.h"
 
 #include <lcms2.h>
 
@@ -13,7 +13,7 @@
 #include "core/byte_reader.h"
 #include "platform/process.h"
 
-// The library works on whole pixels in the order of a packed image. It is told to keep no last colour in a transform, so
+// The library works on whole pixels in the order of a packed image. It is told to keep no last color in a transform, so
 // that threads can share one.
 //
 // Profiles come with pictures from anywhere. Those of an unlikely size are left alone, and so are the tags of type 'mpet': a
@@ -57,7 +57,7 @@ std::vector<uint8_t> TrustedTags(std::span<const uint8_t> profile) {
   return trusted;
 }
 
-// Null for bytes that are no profile of devices with RGB or grey colours.
+// Null for bytes that are no profile of devices with RGB or gray colors.
 Profile OpenProfile(std::span<const uint8_t> bytes) {
   const std::vector<uint8_t> trusted = TrustedTags(bytes);
   if (trusted.empty()) return nullptr;
@@ -66,8 +66,8 @@ Profile OpenProfile(std::span<const uint8_t> bytes) {
   constexpr cmsProfileClassSignature kDevices[] = {cmsSigInputClass, cmsSigDisplayClass, cmsSigOutputClass,
                                                    cmsSigColorSpaceClass};
   const bool device = std::ranges::find(kDevices, cmsGetDeviceClass(profile.get())) != std::end(kDevices);
-  const cmsColorSpaceSignature colours = cmsGetColorSpace(profile.get());
-  return device && (colours == cmsSigRgbData || colours == cmsSigGrayData) ? std::move(profile) : nullptr;
+  const cmsColorSpaceSignature colors = cmsGetColorSpace(profile.get());
+  return device && (colors == cmsSigRgbData || colors == cmsSigGrayData) ? std::move(profile) : nullptr;
 }
 
 Profile OpenSource(std::span<const uint8_t> bytes) {
@@ -81,16 +81,16 @@ Profile OpenScreen(std::span<const uint8_t> bytes) {
   return fits ? std::move(screen) : Profile(cmsCreate_sRGBProfile());
 }
 
-bool IsGrey(const uint8_t* bgr, int32_t pixels, int32_t step) {
+bool IsGray(const uint8_t* bgr, int32_t pixels, int32_t step) {
   for (int32_t i = 0; i < pixels; ++i, bgr += step) {
     if (bgr[0] != bgr[1] || bgr[1] != bgr[2]) return false;
   }
   return true;
 }
 
-bool IsGrey(const PackedImage& image) {
+bool IsGray(const PackedImage& image) {
   for (int32_t r = 0; r < image.Height(); ++r) {
-    if (!IsGrey(image.StoredRow(r).data(), image.Width(), 3)) return false;
+    if (!IsGray(image.StoredRow(r).data(), image.Width(), 3)) return false;
   }
   return true;
 }
@@ -116,84 +116,84 @@ void ForBandsOfRows(int32_t rows, uint64_t pixels, const std::function<void(int3
 
 }  // namespace
 
-ColourTransform::ColourTransform(std::span<const uint8_t> source, std::span<const uint8_t> screen) {
+ColorTransform::ColorTransform(std::span<const uint8_t> source, std::span<const uint8_t> screen) {
   const Profile from = OpenSource(source), to = OpenScreen(screen);
   if (from == nullptr || to == nullptr) return;
-  grey_ = cmsGetColorSpace(from.get()) == cmsSigGrayData;
-  // Greys are few: they need no short cut, which would cost dark ones their precision.
-  const cmsUInt32Number flags = grey_ ? cmsFLAGS_NOCACHE | cmsFLAGS_NOOPTIMIZE : cmsFLAGS_NOCACHE;
-  transform_ = cmsCreateTransform(from.get(), grey_ ? TYPE_GRAY_8 : TYPE_BGR_8, to.get(), TYPE_BGR_8, INTENT_PERCEPTUAL, flags);
-  if (transform_ == nullptr || ChangesTestColours()) return;
+  gray_ = cmsGetColorSpace(from.get()) == cmsSigGrayData;
+  // Grays are few: they need no short cut, which would cost dark ones their precision.
+  const cmsUInt32Number flags = gray_ ? cmsFLAGS_NOCACHE | cmsFLAGS_NOOPTIMIZE : cmsFLAGS_NOCACHE;
+  transform_ = cmsCreateTransform(from.get(), gray_ ? TYPE_GRAY_8 : TYPE_BGR_8, to.get(), TYPE_BGR_8, INTENT_PERCEPTUAL, flags);
+  if (transform_ == nullptr || ChangesTestColors()) return;
   cmsDeleteTransform(transform_);
   transform_ = nullptr;
 }
 
-ColourTransform::~ColourTransform() {
+ColorTransform::~ColorTransform() {
   if (transform_ != nullptr) cmsDeleteTransform(transform_);
 }
 
-void ColourTransform::Apply(PackedImage& image) const {
-  if (!ChangesColours() || image.Empty()) return;
+void ColorTransform::Apply(PackedImage& image) const {
+  if (!ChangesColors() || image.Empty()) return;
   if (image.Bits() != 24) return ApplyToColorTable(image);
-  if (grey_ && !IsGrey(image)) return;
+  if (gray_ && !IsGray(image)) return;
   const uint64_t pixels = static_cast<uint64_t>(image.Width()) * static_cast<uint64_t>(image.Height());
   ForBandsOfRows(image.Height(), pixels, [&](int32_t first, int32_t end) { ApplyToRows(image, first, end); });
 }
 
-void ColourTransform::ApplyToColorTable(PackedImage& image) const {
+void ColorTransform::ApplyToColorTable(PackedImage& image) const {
   uint8_t* const table = image.ColorTable().data();
   const int32_t colors = image.Colors();
-  if (grey_ && !IsGrey(table, colors, 4)) return;
+  if (gray_ && !IsGray(table, colors, 4)) return;
   for (int32_t i = 0; i < colors; ++i) {
     uint8_t* const bgr = table + 4 * i;
-    if (grey_) {
-      MapGreys(bgr, 1);
+    if (gray_) {
+      MapGrays(bgr, 1);
     } else {
       cmsDoTransform(transform_, bgr, bgr, 1);
     }
   }
 }
 
-void ColourTransform::ApplyToRows(PackedImage& image, int32_t first, int32_t end) const {
+void ColorTransform::ApplyToRows(PackedImage& image, int32_t first, int32_t end) const {
   for (int32_t r = first; r < end; ++r) {
     uint8_t* const bgr = image.StoredRow(r).data();
-    if (grey_) {
-      MapGreys(bgr, image.Width());
+    if (gray_) {
+      MapGrays(bgr, image.Width());
     } else {
       cmsDoTransform(transform_, bgr, bgr, static_cast<cmsUInt32Number>(image.Width()));
     }
   }
 }
 
-void ColourTransform::MapGreys(uint8_t* bgr, int32_t pixels) const {
-  for (uint8_t* const end = bgr + 3 * int64_t{pixels}; bgr < end; bgr += 3) std::copy_n(&greys_[3 * size_t{*bgr}], 3, bgr);
+void ColorTransform::MapGrays(uint8_t* bgr, int32_t pixels) const {
+  for (uint8_t* const end = bgr + 3 * int64_t{pixels}; bgr < end; bgr += 3) std::copy_n(&grays_[3 * size_t{*bgr}], 3, bgr);
 }
 
-// Whether a grid of colours and the line of greys, or for grey pictures all greys, come out different.
-bool ColourTransform::ChangesTestColours() {
-  constexpr int32_t kSteps = 6, kGreySteps = 18;  // both end at 255
-  std::vector<uint8_t> colours, changed;
+// Whether a grid of colors and the line of grays, or for gray pictures all grays, come out different.
+bool ColorTransform::ChangesTestColors() {
+  constexpr int32_t kSteps = 6, kGraySteps = 18;  // both end at 255
+  std::vector<uint8_t> colors, changed;
   const auto add = [&](int32_t blue, int32_t green, int32_t red) {
-    for (const int32_t value : {blue, green, red}) colours.push_back(static_cast<uint8_t>(value));
+    for (const int32_t value : {blue, green, red}) colors.push_back(static_cast<uint8_t>(value));
   };
-  for (int32_t i = 0; i < kGreys; ++i) {
-    if (grey_ || i % (255 / (kGreySteps - 1)) == 0) add(i, i, i);
+  for (int32_t i = 0; i < kGrays; ++i) {
+    if (gray_ || i % (255 / (kGraySteps - 1)) == 0) add(i, i, i);
   }
-  for (int32_t i = 0; i < kSteps * kSteps * kSteps && !grey_; ++i) {
+  for (int32_t i = 0; i < kSteps * kSteps * kSteps && !gray_; ++i) {
     constexpr int32_t kStep = 255 / (kSteps - 1);
     add(i % kSteps * kStep, i / kSteps % kSteps * kStep, i / kSteps / kSteps * kStep);
   }
-  changed.resize(colours.size());
-  const auto pixels = static_cast<cmsUInt32Number>(colours.size() / 3);
-  if (grey_) {
-    std::array<uint8_t, kGreys> values;
-    for (int32_t i = 0; i < kGreys; ++i) values[static_cast<size_t>(i)] = static_cast<uint8_t>(i);
-    cmsDoTransform(transform_, values.data(), greys_.data(), pixels);
-    std::ranges::copy(greys_, changed.begin());
+  changed.resize(colors.size());
+  const auto pixels = static_cast<cmsUInt32Number>(colors.size() / 3);
+  if (gray_) {
+    std::array<uint8_t, kGrays> values;
+    for (int32_t i = 0; i < kGrays; ++i) values[static_cast<size_t>(i)] = static_cast<uint8_t>(i);
+    cmsDoTransform(transform_, values.data(), grays_.data(), pixels);
+    std::ranges::copy(grays_, changed.begin());
   } else {
-    cmsDoTransform(transform_, colours.data(), changed.data(), pixels);
+    cmsDoTransform(transform_, colors.data(), changed.data(), pixels);
   }
-  return !std::ranges::equal(colours, changed, [](uint8_t a, uint8_t b) { return std::abs(a - b) <= kUnseen; });
+  return !std::ranges::equal(colors, changed, [](uint8_t a, uint8_t b) { return std::abs(a - b) <= kUnseen; });
 }
 
 }  // namespace fotomill

@@ -1,0 +1,13 @@
+#pragma once
+
+#include <cstdint>
+
+namespace fotomill {
+
+// An upright rectangle in pixels, y downward.
+struct Rectangle {
+  int32_t x = 0, y = 0, width = 0, height = 0;
+  bool operator==(const Rectangle&) const = default;
+};
+
+}  // namespace fotomill
