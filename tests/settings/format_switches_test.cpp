@@ -5,11 +5,13 @@
 #include "core/data_folder.h"
 #include "registry/registry.h"
 #include "support/files.h"
+#include "support/scoped_settings.h"
 
 namespace fotomill {
 namespace {
 
 TEST(FormatSwitches, LastUntilTheyAreTheDefaultAgain) {
+  const test::ScopedSettings settingsBefore;
   const test::TemporaryFolder folder;
   SetDataFolder(folder.Path());
   test::WriteText(ConfigurationPath(), "[Formats]\nEXE=1\nNONE=1\n[Fotomill]\nUnknown=7\n");
