@@ -1,5 +1,5 @@
 #include "desktop/models/browser/browser_model.h"
-#include "desktop/models/browser/palette.h"
+#include "desktop/models/drawing/list_palette.h"
 
 #include <gtest/gtest.h>
 
@@ -9,7 +9,7 @@
 #include "desktop/models/browser/detail_columns.h"
 #include "desktop/models/browser/folder_trail.h"
 #include "desktop/models/browser/path_crumbs.h"
-#include "desktop/models/browser/toolbar_buttons.h"
+#include "desktop/models/shell/toolbar_buttons.h"
 
 namespace fotomill::desktop {
 namespace {

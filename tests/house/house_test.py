@@ -7,6 +7,7 @@ judges a small tree with one breach of every rule, so that a rule that no longer
 import re
 import sys
 import tempfile
+from collections import Counter
 from pathlib import Path
 
 # The rooms of src/ from the ground up. A file includes from its own room and from rooms of lower floors.
@@ -48,6 +49,10 @@ INCLUDE = re.compile(r'\s*#\s*include\s*(["<])([^">]+)[">]')
 NOT_YET_ON_OPTIONS = {"formats", "metadata", "picture", "plugins", "processing", "registry", "catalog"}
 
 LONGEST_FILE = 900
+MOST_FILES = 40  # sources in one folder of src/, headers counted
+
+# What windows show is known without them, so that it is tested without a display.
+MODELS, WINDOWS = "desktop/models/", "desktop/windows/"
 DRAWERS = {"util", "utils", "misc", "common", "helper", "helpers", "stuff"}
 
 
@@ -77,6 +82,8 @@ def include_breaches(path, line):
         yield f"<{target}> belongs behind a door of src/platform"
     if not quoted and target.startswith("wx/") and own != "desktop":
         yield f"<{target}> outside src/desktop"
+    if path.startswith(MODELS) and (quoted and target.startswith(WINDOWS) or not quoted and target.startswith("wx/")):
+        yield f"a model may not include {target}"
 
 
 def circle_breaches(includes):
@@ -95,6 +102,14 @@ def circle_breaches(includes):
 
     for path in sorted(includes):
         yield from visit(path, [])
+
+
+def crowd_breaches(sources):
+    """Folders of src/ that hold too many sources to find one's way in. `sources` are paths below the project."""
+    crowds = Counter(Path(name).parent.as_posix() for name in sources if name.startswith("src/"))
+    for folder, count in sorted(crowds.items()):
+        if count > MOST_FILES:
+            yield folder, 1, f"holds {count} sources, {MOST_FILES} are the most"
 
 
 def breaches(project):
@@ -124,6 +139,7 @@ def breaches(project):
             if SYSTEM_MACRO.match(line) and name not in SYSTEM_HEADERS and not any(name.startswith(folder + "/") for folder in SYSTEM_FOLDERS):
                 yield name, number, "asks which system it runs on outside src/platform"
     yield from circle_breaches(includes)
+    yield from crowd_breaches(source.relative_to(project).as_posix() for source in sources)
 
 
 # One breach of each rule: file, contents, the message's tell-tale (None: must pass).
@@ -150,6 +166,11 @@ EXAMPLES = [
     ("src/core/long.cpp", "\n" * (LONGEST_FILE + 1), "longer than"),
     ("src/core/common.h", "", "is a drawer"),
     ("src/attic/box.cpp", "", "no room"),
+    ("src/desktop/models/list.cpp", "#include <wx/string.h>\n", "a model may not include wx/string.h"),
+    ("src/desktop/models/tree.cpp", '#include "desktop/windows/frame.h"\n', "a model may not include desktop/windows/frame.h"),
+    ("src/desktop/windows/frame.h", '#include "desktop/models/tree.h"\n#include <wx/frame.h>\n', None),
+    ("src/batch", None, "holds 41 sources"),
+    *[(f"src/batch/step{number}.h", "", None) for number in range(MOST_FILES + 1)],
 ]
 
 
@@ -157,6 +178,8 @@ def own_faults():
     """Where the rules do not give what EXAMPLES say."""
     with tempfile.TemporaryDirectory() as folder:
         for name, contents, _ in EXAMPLES:
+            if contents is None:  # a folder, filled by the examples after it
+                continue
             path = Path(folder, name)
             path.parent.mkdir(parents=True, exist_ok=True)
             path.write_text(contents)

@@ -13,7 +13,7 @@
 #include "batch/progress_box.h"
 #include "batch/prompts.h"
 #include "batch/run.h"
-#include "desktop/models/view/rgb_image.h"
+#include "desktop/models/drawing/rgb_image.h"
 
 namespace fotomill::desktop {
 

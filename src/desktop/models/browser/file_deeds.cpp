@@ -4,7 +4,7 @@
 #include <set>
 
 #include "batch/destination_name.h"
-#include "desktop/models/browser/previous_file.h"
+#include "desktop/models/files/previous_file.h"
 #include "desktop/models/thumbnails/thumbnail.h"
 #include "platform/file_view.h"
 #include "platform/files.h"

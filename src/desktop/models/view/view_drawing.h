@@ -2,7 +2,7 @@
 
 #include <cstdint>
 
-#include "desktop/models/view/rgb_image.h"
+#include "desktop/models/drawing/rgb_image.h"
 #include "desktop/models/view/view_transform.h"
 
 namespace fotomill::desktop {

@@ -9,7 +9,7 @@
 #include <vector>
 
 #include "core/status.h"
-#include "desktop/models/view/rgb_image.h"
+#include "desktop/models/drawing/rgb_image.h"
 #include "picture/picture_record.h"
 #include "platform/files.h"
 #include "processing/geometry/orient.h"

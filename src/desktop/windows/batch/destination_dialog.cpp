@@ -14,7 +14,7 @@
 #include "core/text.h"
 #include "desktop/models/browser/browser_model.h"
 #include "desktop/windows/setup/override_box.h"
-#include "desktop/windows/shell/wx_text.h"
+#include "desktop/windows/widgets/wx_text.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"

@@ -7,10 +7,10 @@
 #include <wx/stattext.h>
 #include <wx/textctrl.h>
 
-#include "desktop/windows/shell/help.h"
-#include "desktop/windows/shell/looks.h"
-#include "desktop/windows/shell/wx_text.h"
+#include "desktop/windows/dialogs/help.h"
 #include "desktop/windows/widgets/bitmaps.h"
+#include "desktop/windows/widgets/looks.h"
+#include "desktop/windows/widgets/wx_text.h"
 #include "platform/paths.h"
 #include "settings/settings.h"
 

@@ -14,9 +14,9 @@
 
 #include "core/choice_lists.h"
 #include "core/text.h"
-#include "desktop/windows/shell/looks.h"
-#include "desktop/windows/shell/wx_text.h"
 #include "desktop/windows/widgets/bitmaps.h"
+#include "desktop/windows/widgets/looks.h"
+#include "desktop/windows/widgets/wx_text.h"
 #include "platform/clock.h"
 #include "platform/paths.h"
 #include "settings/settings.h"

@@ -8,7 +8,7 @@
 #include <wx/statbmp.h>
 #include <wx/stattext.h>
 
-#include "desktop/windows/shell/wx_text.h"
+#include "desktop/windows/widgets/wx_text.h"
 #include "settings/configuration.h"
 #include "settings/settings.h"
 

@@ -10,13 +10,13 @@
 #include <algorithm>
 
 #include "core/choice_lists.h"
-#include "desktop/models/browser/event_log.h"
+#include "desktop/models/shell/event_log.h"
 #include "desktop/windows/browser/details_list.h"
-#include "desktop/windows/browser/folder_drop.h"
 #include "desktop/windows/browser/path_bar.h"
 #include "desktop/windows/browser/thumbnail_canvas.h"
 #include "desktop/windows/browser/update_bar.h"
-#include "desktop/windows/shell/wx_text.h"
+#include "desktop/windows/files/folder_drop.h"
+#include "desktop/windows/widgets/wx_text.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
 

@@ -8,8 +8,8 @@
 
 #include "desktop/models/browser/folder_listing.h"
 #include "desktop/windows/browser/folder_menu.h"
-#include "desktop/windows/shell/wx_text.h"
 #include "desktop/windows/widgets/bitmaps.h"
+#include "desktop/windows/widgets/wx_text.h"
 #include "platform/paths.h"
 
 namespace fotomill::desktop {

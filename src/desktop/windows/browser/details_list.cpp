@@ -4,8 +4,8 @@
 
 #include <algorithm>
 
-#include "desktop/models/browser/event_log.h"
-#include "desktop/windows/shell/wx_text.h"
+#include "desktop/models/shell/event_log.h"
+#include "desktop/windows/widgets/wx_text.h"
 
 namespace fotomill::desktop {
 

@@ -7,10 +7,10 @@
 #include <algorithm>
 #include <thread>
 
-#include "desktop/models/browser/event_log.h"
 #include "desktop/models/browser/folder_listing.h"
-#include "desktop/windows/shell/wx_text.h"
+#include "desktop/models/shell/event_log.h"
 #include "desktop/windows/widgets/bitmaps.h"
+#include "desktop/windows/widgets/wx_text.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
 #include "platform/volumes.h"

@@ -9,7 +9,7 @@
 #include <utility>
 #include <vector>
 
-#include "desktop/models/browser/favourites.h"
+#include "desktop/models/shell/favourites.h"
 
 namespace fotomill::desktop {
 

@@ -4,9 +4,9 @@
 
 #include <algorithm>
 
-#include "desktop/models/browser/event_log.h"
 #include "desktop/models/browser/file_tip.h"
-#include "desktop/windows/shell/wx_text.h"
+#include "desktop/models/shell/event_log.h"
+#include "desktop/windows/widgets/wx_text.h"
 #include "settings/settings.h"
 
 namespace fotomill::desktop {

@@ -7,13 +7,13 @@
 #include <algorithm>
 #include <vector>
 
-#include "desktop/models/browser/event_log.h"
 #include "desktop/models/browser/folder_listing.h"
 #include "desktop/models/browser/folder_trail.h"
+#include "desktop/models/shell/event_log.h"
 #include "desktop/windows/browser/crumb_strip.h"
 #include "desktop/windows/browser/folder_menu.h"
-#include "desktop/windows/shell/wx_text.h"
 #include "desktop/windows/widgets/bitmaps.h"
+#include "desktop/windows/widgets/wx_text.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"

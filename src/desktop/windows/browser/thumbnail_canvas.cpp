@@ -8,10 +8,10 @@
 #include <unordered_set>
 
 #include "core/choice_lists.h"
-#include "desktop/models/browser/event_log.h"
-#include "desktop/windows/shell/looks.h"
-#include "desktop/windows/shell/screen_reader.h"
-#include "desktop/windows/shell/wx_text.h"
+#include "desktop/models/shell/event_log.h"
+#include "desktop/windows/widgets/looks.h"
+#include "desktop/windows/widgets/screen_reader.h"
+#include "desktop/windows/widgets/wx_text.h"
 #include "platform/clock.h"
 #include "platform/paths.h"
 #include "settings/settings.h"

@@ -6,12 +6,12 @@
 #include <cmath>
 
 #include "core/text.h"
-#include "desktop/models/browser/event_log.h"
+#include "desktop/models/shell/event_log.h"
 #include "desktop/windows/browser/thumbnail_badges.h"
 #include "desktop/windows/browser/thumbnail_canvas.h"
-#include "desktop/windows/shell/looks.h"
-#include "desktop/windows/shell/wx_text.h"
 #include "desktop/windows/widgets/bitmaps.h"
+#include "desktop/windows/widgets/looks.h"
+#include "desktop/windows/widgets/wx_text.h"
 #include "platform/clock.h"
 #include "platform/paths.h"
 

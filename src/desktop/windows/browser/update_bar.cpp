@@ -8,8 +8,8 @@
 #include <iterator>
 
 #include "catalog/thumbnails/thumbnail_update.h"
-#include "desktop/windows/shell/looks.h"
-#include "desktop/windows/shell/wx_text.h"
+#include "desktop/windows/widgets/looks.h"
+#include "desktop/windows/widgets/wx_text.h"
 
 namespace fotomill::desktop {
 

@@ -2,7 +2,7 @@
 
 #include <wx/app.h>
 
-#include "desktop/models/browser/event_log.h"
+#include "desktop/models/shell/event_log.h"
 #include "desktop/windows/browser/update_bar.h"
 
 namespace fotomill::desktop {

@@ -8,9 +8,9 @@
 
 #include "core/shown_text.h"
 #include "core/whole_number.h"
-#include "desktop/windows/browser/mask_list.h"
 #include "desktop/windows/setup/color_button.h"
-#include "desktop/windows/shell/wx_text.h"
+#include "desktop/windows/setup/mask_list.h"
+#include "desktop/windows/widgets/wx_text.h"
 #include "registry/registry.h"
 
 namespace fotomill::desktop {

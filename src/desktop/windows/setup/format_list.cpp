@@ -2,9 +2,9 @@
 
 #include <wx/msgdlg.h>
 
-#include "desktop/models/browser/event_log.h"
-#include "desktop/windows/shell/looks.h"
-#include "desktop/windows/shell/wx_text.h"
+#include "desktop/models/shell/event_log.h"
+#include "desktop/windows/widgets/looks.h"
+#include "desktop/windows/widgets/wx_text.h"
 #include "registry/registry.h"
 #include "settings/format_switches.h"
 

@@ -2,7 +2,7 @@
 
 #include "desktop/models/setup/override_options.h"
 #include "desktop/windows/setup/setup_box.h"
-#include "desktop/windows/shell/wx_text.h"
+#include "desktop/windows/widgets/wx_text.h"
 #include "registry/registry.h"
 #include "settings/settings.h"
 

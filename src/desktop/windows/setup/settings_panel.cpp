@@ -13,10 +13,10 @@
 
 #include "catalog/history/file_history.h"
 #include "desktop/models/setup/setup_help.h"
-#include "desktop/windows/browser/mask_list.h"
+#include "desktop/windows/dialogs/help.h"
 #include "desktop/windows/setup/color_button.h"
-#include "desktop/windows/shell/help.h"
-#include "desktop/windows/shell/wx_text.h"
+#include "desktop/windows/setup/mask_list.h"
+#include "desktop/windows/widgets/wx_text.h"
 
 namespace fotomill::desktop {
 

@@ -14,14 +14,14 @@
 #include <algorithm>
 
 #include "core/data_folder.h"
-#include "desktop/models/browser/event_log.h"
 #include "desktop/models/setup/configuration_transfer.h"
+#include "desktop/models/shell/event_log.h"
 #include "desktop/windows/batch/batch_runner.h"
+#include "desktop/windows/dialogs/help.h"
 #include "desktop/windows/setup/format_list.h"
-#include "desktop/windows/shell/help.h"
-#include "desktop/windows/shell/looks.h"
 #include "desktop/windows/shell/main_frame.h"
-#include "desktop/windows/shell/wx_text.h"
+#include "desktop/windows/widgets/looks.h"
+#include "desktop/windows/widgets/wx_text.h"
 #include "platform/files.h"
 #include "settings/configuration.h"
 

@@ -9,14 +9,14 @@
 #include <string>
 
 #include "core/data_folder.h"
-#include "desktop/models/browser/event_log.h"
-#include "desktop/models/browser/previous_file.h"
+#include "desktop/models/files/previous_file.h"
+#include "desktop/models/shell/event_log.h"
 #include "desktop/models/view/view_picture.h"
 #include "desktop/windows/setup/override_box.h"
 #include "desktop/windows/shell/main_frame.h"
-#include "desktop/windows/shell/screen_profile.h"
-#include "desktop/windows/shell/wx_text.h"
+#include "desktop/windows/view/screen_profile.h"
 #include "desktop/windows/widgets/control_names.h"
+#include "desktop/windows/widgets/wx_text.h"
 #include "platform/first_start.h"
 #include "platform/folders.h"
 #include "platform/process.h"

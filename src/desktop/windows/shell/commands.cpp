@@ -2,11 +2,11 @@
 
 #include "core/choice_lists.h"
 #include "desktop/windows/batch/batch_runner.h"
-#include "desktop/windows/batch/sequential_rename_dialog.h"
-#include "desktop/windows/browser/select_dialog.h"
 #include "desktop/windows/compare/compare_frame.h"
-#include "desktop/windows/shell/command_finder.h"
-#include "desktop/windows/shell/file_actions.h"
+#include "desktop/windows/dialogs/command_finder.h"
+#include "desktop/windows/dialogs/select_dialog.h"
+#include "desktop/windows/files/file_actions.h"
+#include "desktop/windows/files/sequential_rename_dialog.h"
 #include "desktop/windows/shell/main_frame.h"
 #include "desktop/windows/shell/tool_windows.h"
 

@@ -7,8 +7,8 @@
 #include <vector>
 
 #include "catalog/history/file_history.h"
-#include "desktop/models/browser/favourites.h"
-#include "desktop/models/browser/session.h"
+#include "desktop/models/shell/favourites.h"
+#include "desktop/models/shell/session.h"
 #include "desktop/windows/browser/browser_page.h"
 #include "desktop/windows/browser/thumbnail_service.h"
 

@@ -1,15 +1,15 @@
 #include "desktop/windows/shell/tool_windows.h"
 
-#include "desktop/models/browser/event_log.h"
 #include "desktop/models/setup/setup_help.h"
-#include "desktop/windows/browser/upkeep_boxes.h"
-#include "desktop/windows/setup/history_box.h"
-#include "desktop/windows/setup/plugin_box.h"
+#include "desktop/models/shell/event_log.h"
+#include "desktop/windows/dialogs/help.h"
+#include "desktop/windows/dialogs/plugin_box.h"
+#include "desktop/windows/dialogs/upkeep_boxes.h"
+#include "desktop/windows/history/history_box.h"
+#include "desktop/windows/info/exif_frame.h"
+#include "desktop/windows/info/info_frame.h"
 #include "desktop/windows/setup/setup_box.h"
-#include "desktop/windows/shell/help.h"
 #include "desktop/windows/shell/main_frame.h"
-#include "desktop/windows/view/exif_frame.h"
-#include "desktop/windows/view/info_frame.h"
 #include "settings/setup_dialog.h"
 
 namespace fotomill::desktop {

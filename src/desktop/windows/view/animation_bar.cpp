@@ -4,8 +4,8 @@
 
 #include <algorithm>
 
-#include "desktop/windows/shell/screen_reader.h"
 #include "desktop/windows/widgets/bitmaps.h"
+#include "desktop/windows/widgets/screen_reader.h"
 #include "settings/settings.h"
 
 namespace fotomill::desktop {

@@ -8,7 +8,7 @@
 #include <wx/spinctrl.h>
 #include <wx/stattext.h>
 
-#include "desktop/models/browser/event_log.h"
+#include "desktop/models/shell/event_log.h"
 
 namespace fotomill::desktop {
 

@@ -6,8 +6,8 @@
 #include <cmath>
 #include <thread>
 
-#include "desktop/models/browser/event_log.h"
-#include "desktop/windows/shell/system_animations.h"
+#include "desktop/models/shell/event_log.h"
+#include "desktop/windows/view/system_animations.h"
 #include "platform/clock.h"
 #include "registry/registry.h"
 

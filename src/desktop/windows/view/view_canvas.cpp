@@ -7,10 +7,10 @@
 #include <cmath>
 
 #include "core/choice_lists.h"
-#include "desktop/models/browser/event_log.h"
-#include "desktop/models/browser/palette.h"
-#include "desktop/windows/shell/wx_text.h"
+#include "desktop/models/drawing/list_palette.h"
+#include "desktop/models/shell/event_log.h"
 #include "desktop/windows/widgets/bitmaps.h"
+#include "desktop/windows/widgets/wx_text.h"
 #include "platform/clock.h"
 #include "platform/paths.h"
 #include "processing/geometry/scale.h"

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "desktop/windows/shell/key_commands.h"
+#include "desktop/windows/widgets/key_commands.h"
 
 namespace fotomill::desktop {
 

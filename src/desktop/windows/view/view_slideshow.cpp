@@ -4,7 +4,7 @@
 
 #include <random>
 
-#include "desktop/models/browser/event_log.h"
+#include "desktop/models/shell/event_log.h"
 #include "desktop/windows/view/slideshow_dialog.h"
 
 namespace fotomill::desktop {

@@ -5,7 +5,7 @@
 
 #include <string_view>
 
-#include "desktop/models/view/rgb_image.h"
+#include "desktop/models/drawing/rgb_image.h"
 
 namespace fotomill::desktop {
 

@@ -25,7 +25,7 @@
 #include <algorithm>
 #include <vector>
 
-#include "desktop/windows/shell/screen_reader.h"
+#include "desktop/windows/widgets/screen_reader.h"
 
 namespace fotomill::desktop {
 

@@ -1,0 +1,75 @@
+#include "desktop/models/files/pasted_picture.h"
+
+#include <algorithm>
+#include <cstdint>
+#include <span>
+
+#include "batch/destination_name.h"
+#include "core/plain_name.h"
+#include "picture/picture_record.h"
+#include "platform/files.h"
+#include "platform/paths.h"
+#include "registry/registry.h"
+#include "settings/settings.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+constexpr const char* kExtension = ".png";
+constexpr int kMostLostRaces = 100;  // for a name, against other programs
+
+// The first path that is free; empty when there is none.
+std::string FreePath(const std::string& folder) {
+  const std::string_view wanted = settings.ClipboardPictureName.view();
+  const std::string name(IsPlainName(wanted) && !wanted.empty() ? wanted : defaultSettings.ClipboardPictureName.view());
+  std::string path = platform::JoinFolder(folder, name + kExtension);
+  const bool free = !platform::FileExists(path) || MakeNumberedVariant(path, 1, INT32_MAX, platform::FileExists);
+  return free ? path : std::string();
+}
+
+Status ToRecord(const PastedPicture& pasted, PictureRecord& picture) {
+  RETURN_IF_BAD(ToPacked(pasted.pixels, picture.image));
+  if (pasted.alpha.empty()) return Status::Ok;
+  const auto width = static_cast<size_t>(pasted.pixels.width);
+  RETURN_IF_BAD(NewAlphaPlane(pasted.pixels.width, pasted.pixels.height, picture.alpha));
+  for (int32_t y = 0; y < pasted.pixels.height; ++y) {
+    const std::span<uint8_t> row = picture.alpha.Row(y);
+    std::copy_n(pasted.alpha.begin() + static_cast<std::ptrdiff_t>(static_cast<size_t>(y) * width), width, row.begin());
+  }
+  return Status::Ok;
+}
+
+// Writes it under a name that is free there, and says which.
+Status Write(const PastedPicture& pasted, const std::string& folder, std::string& path) {
+  const PicturePointer picture = NewPictureRecord();
+  if (picture == nullptr) return Status::MemoryAllocationError;
+  RETURN_IF_BAD(ToRecord(pasted, *picture));
+  WriteOptions options;
+  options.existing = platform::Existing::Refuse;
+  Status status = Status::ErrorCreatingFile;
+  for (int race = 0; race < kMostLostRaces; ++race) {
+    path = FreePath(folder);
+    if (path.empty()) break;
+    status = WritePicture(*picture, path, options);
+    const bool lostRace = status == Status::ErrorCreatingFile && platform::IsRegularFile(path);
+    if (!lostRace) break;
+  }
+  return status;
+}
+
+}  // namespace
+
+DeedResult KeepPastedPicture(const PastedPicture& pasted, const std::string& folder) {
+  DeedResult result{FileDeed{DeedKind::Create, {}}, {}};
+  std::string path;
+  const Status status = Write(pasted, folder, path);
+  if (status == Status::Ok) {
+    result.done.steps.push_back({path, path});
+  } else {
+    result.failures.push_back({path.empty() ? folder : path, std::string(StatusMessage(status))});
+  }
+  return result;
+}
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,21 @@
+#pragma once
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "desktop/models/browser/file_deeds.h"
+#include "desktop/models/drawing/rgb_image.h"
+
+namespace fotomill::desktop {
+
+struct PastedPicture {
+  RgbImage pixels;
+  std::vector<uint8_t> alpha;  // a byte a pixel, top row first; empty for none
+};
+
+// Keeps a picture that came from another program: as a PNG file in `folder`, called ClipboardPictureName, or that with a
+// number where the name is taken. The deed makes that file; a failure says why there is none. May take long; any thread.
+DeedResult KeepPastedPicture(const PastedPicture& pasted, const std::string& folder);
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,76 @@
+#include "desktop/models/info/exif_report.h"
+
+#include "catalog/thumbnails/exif_thumbnail.h"
+#include "core/shown_text.h"
+#include "metadata/exif/exif_source.h"
+#include "metadata/exif/exif_tags.h"
+#include "metadata/exif/exif_text.h"
+#include "settings/settings.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+// Gathers a walk as rows and as the text that the core makes of it.
+class Gather : public ExifSink {
+ public:
+  explicit Gather(ExifReport& report) : report_(report) {}
+
+  void Directory(int32_t number, std::string_view label) override {
+    report_.rows.push_back({true, 0, "DIRECTORY " + std::string(label), {}});
+    text_.Directory(number, label);
+  }
+  void Line(const ExifLine& line) override {
+    std::string name(line.name);
+    if (settings.ExifShowTypes != 0) name.append(" ").append(ExifTypeLabel(line.value.type));
+    report_.rows.push_back({false, line.value.tag, std::move(name), EscapeControls(line.text)});
+    text_.Line(line);
+  }
+  void Finish() {
+    report_.text = text_.Text();
+    if (!text_.Complete()) report_.problem = "There was no memory for all of the lines.";
+  }
+
+ private:
+  ExifReport& report_;
+  ExifText text_;
+};
+
+void TakeThumbnail(std::span<const uint8_t> bytes, ExifReport& report) {
+  report.thumbnailBytes.assign(bytes.begin(), bytes.end());
+  PicturePointer picture;
+  if (bytes.empty() || DecodeExifThumbnail(bytes, picture) != Status::Ok) return;
+  if (ToRgb(picture->image, report.thumbnail) != Status::Ok) report.thumbnail = {};
+}
+
+}  // namespace
+
+ExifReport ReadExifReport(const std::string& path) {
+  ExifReport report;
+  ExifSource source;
+  report.status = source.Open(path.c_str());
+  if (report.status != Status::Ok) {
+    report.problem = std::string(StatusMessage(report.status));
+    return report;
+  }
+  if (source.Block().empty()) {
+    report.problem = "There is no EXIF in this file.";
+    return report;
+  }
+  Gather gather(report);
+  ExifFindings findings;
+  if (!WalkExif(source.Block(), &gather, &findings)) {
+    report.status = Status::DamagedFile;
+    report.problem = "The EXIF block of this file is damaged: it does not begin as one.";
+    return report;
+  }
+  gather.Finish();
+  TakeThumbnail(ExifThumbnail(source.Block(), findings), report);
+  if (!source.Intact()) {
+    report.status = Status::FileReadError;
+    report.problem = "The file became shorter while it was read, so some of this may be wrong.";
+  }
+  return report;
+}
+
+}  // namespace fotomill::desktop

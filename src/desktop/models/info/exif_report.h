@@ -1,0 +1,33 @@
+#pragma once
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "core/status.h"
+#include "desktop/models/drawing/rgb_image.h"
+
+namespace fotomill::desktop {
+
+// One line of the EXIF viewer: the head of a directory, or a value below it.
+struct ExifRow {
+  bool heading = false;
+  uint16_t tag = 0;
+  std::string name;  // "DIRECTORY EXIF", or the tag's name, with its type when ExifShowTypes asks for that
+  std::string text;
+};
+
+// The EXIF of one picture file as the viewer shows it.
+struct ExifReport {
+  Status status = Status::Ok;
+  std::string problem;  // a sentence for people where there is nothing to show, or not all; empty otherwise
+  std::vector<ExifRow> rows;
+  std::string text;                     // the same lines as one text, to be copied, saved or printed
+  RgbImage thumbnail;                   // decoded; empty when there is none that can be
+  std::vector<uint8_t> thumbnailBytes;  // as it lies in the block: a JPEG stream
+};
+
+// Reads and walks a file's EXIF block. Takes as long as the disk takes; any thread may call it.
+ExifReport ReadExifReport(const std::string& path);
+
+}  // namespace fotomill::desktop

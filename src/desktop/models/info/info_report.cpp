@@ -1,0 +1,233 @@
+#include "desktop/models/info/info_report.h"
+
+#include <algorithm>
+#include <cstdio>
+#include <map>
+#include <unordered_map>
+
+#include "batch/picture_failure.h"
+#include "core/choice_lists.h"
+#include "core/shown_text.h"
+#include "core/text.h"
+#include "desktop/models/history/history_dates.h"
+#include "desktop/models/info/exif_report.h"
+#include "platform/files.h"
+#include "platform/paths.h"
+#include "registry/registry.h"
+#include "settings/settings.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+constexpr const char* kDetailsTitle = "Details";
+
+template <typename... Arguments>
+std::string Printed(const char* format, Arguments... arguments) {
+  char text[96];
+  std::snprintf(text, sizeof text, format, arguments...);
+  return text;
+}
+
+std::string PixelsText(int32_t width, int32_t height) {
+  const double millions = static_cast<double>(width) * height / 1e6;
+  std::string text = Printed("%d x %d pixels", width, height);
+  if (millions >= 0.1) text += Printed(" (%.1f megapixels)", millions);
+  return text;
+}
+
+std::string BytesText(uint64_t bytes) { return WithThousands(bytes) + (bytes == 1 ? " byte" : " bytes"); }
+
+// How large the picture is on paper at its own resolution, or at InfoResolution when the file has none.
+std::string PrintSize(const PictureRecord& picture) {
+  const bool own = picture.metadata.dpiX > 0 && picture.metadata.dpiY > 0;
+  const double assumed = std::max(settings.InfoResolution, 1);
+  const double x = own ? picture.metadata.dpiX : assumed, y = own ? picture.metadata.dpiY : assumed;
+  const char* const how = own ? "" : " at %g dots per inch";
+  std::string text;
+  switch (settings.InfoUnits) {
+    case choice::kPixels: return {};
+    case choice::kCentimetres:
+      text = Printed("%.2f x %.2f centimeters", picture.width / x * 2.54, picture.height / y * 2.54);
+      break;
+    default: text = Printed("%.2f x %.2f inches", picture.width / x, picture.height / y);
+  }
+  return own ? text : text + Printed(how, assumed);
+}
+
+void AddFileFacts(const std::string& path, FileInfo& info, InfoSection& general) {
+  const platform::FileFacts facts = platform::FactsOf(path);
+  general.lines.push_back({"File name", std::string(platform::FileNameOf(path))});
+  const platform::PathParts parts = platform::SplitPath(path);
+  general.lines.push_back({"Folder", std::string(parts.drive) + std::string(parts.folder)});
+  if (facts.kind == platform::FileKind::Missing) return;
+  info.size = facts.size;
+  general.lines.push_back({"File size", BytesText(facts.size)});
+  general.lines.push_back({"Created", HistoryDate(facts.created, settings.FileHistoryDateMode)});
+  general.lines.push_back({"Changed", HistoryDate(facts.modified, settings.FileHistoryDateMode)});
+}
+
+void AddPictureFacts(const PictureRecord& picture, FileInfo& info, InfoSection& general) {
+  const FormatEntry& row = FormatRow(picture.formatIndex);
+  info.format = row.description.view();
+  info.width = picture.width;
+  info.height = picture.height;
+  info.imageBytes = picture.imageBytes;
+  general.lines.push_back({"Format", info.format});
+  if (!picture.typeName.empty()) general.lines.push_back({"Type", std::string(picture.typeName.view())});
+  general.lines.push_back({"Dimensions", PixelsText(picture.width, picture.height)});
+  std::string depth = Printed(picture.bitsPerPixel == 1 ? "%d bit" : "%d bits", picture.bitsPerPixel);
+  if ((picture.alphaFlags & kHasAlpha) != 0) depth += " and alpha";
+  general.lines.push_back({"Depth", depth});
+  if (picture.pageCount > 1) general.lines.push_back({"Pages", std::to_string(picture.pageCount)});
+  if (picture.metadata.dpiX > 0 && picture.metadata.dpiY > 0) {
+    general.lines.push_back({"Resolution", Printed("%g x %g dots per inch", picture.metadata.dpiX, picture.metadata.dpiY)});
+  }
+  if (std::string size = PrintSize(picture); !size.empty()) general.lines.push_back({"Print size", std::move(size)});
+  general.lines.push_back({"Image data", BytesText(picture.imageBytes)});
+}
+
+// The lines that the codec tells. Those of the form "name: value" are divided.
+InfoSection DetailsOf(const PictureRecord& picture) {
+  InfoSection section{kDetailsTitle, {}};
+  for (size_t i = 0; i < picture.detailLines.Count(); ++i) {
+    const std::string_view line = picture.detailLines.Line(i);
+    const size_t colon = line.find(": ");
+    if (colon == std::string_view::npos) {
+      section.lines.push_back({{}, std::string(line)});
+    } else {
+      // Codecs put blanks in front of the names, so that the values of their lines stand in one column.
+      const std::string_view name = line.substr(0, colon);
+      section.lines.push_back(
+          {std::string(name.substr(std::min(name.find_first_not_of(' '), colon))), std::string(line.substr(colon + 2))});
+    }
+  }
+  return section;
+}
+
+void AddExif(const std::string& path, FileInfo& info) {
+  for (ExifRow& row : ReadExifReport(path).rows) {
+    if (row.heading) {
+      info.sections.push_back({"EXIF: " + row.name.substr(row.name.find(' ') + 1), {}});
+    } else {
+      info.sections.back().lines.push_back({std::move(row.name), std::move(row.text)});
+    }
+  }
+}
+
+std::string ProblemOf(const std::string& path, Status status) {
+  const std::string hint = OpenHint(path, status);
+  return std::string(StatusMessage(status)) + (hint.empty() ? "" : " " + hint);
+}
+
+// How a value differs: every different one with the number of files that have it, the most frequent first.
+std::string SpreadOf(const std::map<std::string, size_t>& counts) {
+  constexpr size_t kMost = 4;
+  std::vector<std::pair<std::string, size_t>> values(counts.begin(), counts.end());
+  std::ranges::stable_sort(values, [](const auto& a, const auto& b) { return a.second > b.second; });
+  std::string text = Printed("%zu different: ", values.size());
+  for (size_t i = 0; i < std::min(values.size(), kMost); ++i) {
+    if (i > 0) text += "; ";
+    text += values[i].first;
+    if (values[i].second > 1) text += Printed(" (%zu files)", values[i].second);
+  }
+  return values.size() > kMost ? text + "; ..." : text;
+}
+
+struct Compared {
+  std::string label;
+  std::map<std::string, size_t> values;
+  size_t files = 0;
+};
+
+std::vector<Compared> Compare(std::span<const FileInfo> files) {
+  std::vector<Compared> all;
+  std::unordered_map<std::string_view, size_t> places;
+  for (const FileInfo& file : files) {
+    for (const InfoSection& section : file.sections) {
+      if (section.title == kDetailsTitle) continue;  // they mean something in files of one format only
+      for (const InfoLine& line : section.lines) {
+        if (line.label.empty() || line.label == "File name") continue;
+        const auto [place, added] = places.emplace(line.label, all.size());
+        if (added) all.push_back({line.label, {}, 0});
+        ++all[place->second].values[line.value];
+        ++all[place->second].files;
+      }
+    }
+  }
+  return all;
+}
+
+}  // namespace
+
+FileInfo ReadFileInfo(const std::string& path) {
+  FileInfo info;
+  info.path = path;
+  InfoSection general{"General", {}};
+  AddFileFacts(path, info, general);
+  PicturePointer picture;
+  info.status = LoadPictureInfo(path.c_str(), picture);
+  if (info.status == Status::Ok) {
+    AddPictureFacts(*picture, info, general);
+    const FormatEntry& row = FormatRow(picture->formatIndex);
+    if (CanTellDetails(row)) info.status = row.details(*picture);
+  }
+  if (info.status != Status::Ok) info.problem = ProblemOf(path, info.status);
+  info.sections.push_back(std::move(general));
+  if (picture != nullptr && picture->detailLines.Count() > 0) info.sections.push_back(DetailsOf(*picture));
+  if (picture != nullptr) AddExif(path, info);
+  return info;
+}
+
+std::vector<InfoSection> SummaryOf(std::span<const FileInfo> files) {
+  InfoSection totals{"Totals", {}}, same{"The same in all", {}}, different{"Different", {}}, failed{"Could not be read", {}};
+  uint64_t size = 0, imageBytes = 0, pixels = 0, pictures = 0;
+  for (const FileInfo& file : files) {
+    size += file.size;
+    imageBytes += file.imageBytes;
+    pixels += static_cast<uint64_t>(file.width) * static_cast<uint64_t>(file.height);
+    pictures += file.width > 0;
+    if (file.status != Status::Ok) failed.lines.push_back({std::string(platform::FileNameOf(file.path)), file.problem});
+  }
+  totals.lines.push_back({"Files", std::to_string(files.size())});
+  totals.lines.push_back({"Pictures", std::to_string(pictures)});
+  totals.lines.push_back({"File size", BytesText(size)});
+  totals.lines.push_back({"Image data", BytesText(imageBytes)});
+  totals.lines.push_back({"Pixels", Printed("%.1f million", static_cast<double>(pixels) / 1e6)});
+  for (const Compared& compared : Compare(files)) {
+    if (compared.files < 2) continue;
+    if (compared.values.size() == 1 && compared.files == files.size()) {
+      same.lines.push_back({compared.label, compared.values.begin()->first});
+    } else {
+      std::string text = compared.values.size() > 1 ? SpreadOf(compared.values) : compared.values.begin()->first;
+      if (compared.files < files.size()) text += Printed(" (in %zu of %zu files)", compared.files, files.size());
+      different.lines.push_back({compared.label, std::move(text)});
+    }
+  }
+  std::vector<InfoSection> sections;
+  for (InfoSection* section : {&totals, &failed, &different, &same}) {
+    if (!section->lines.empty()) sections.push_back(std::move(*section));
+  }
+  return sections;
+}
+
+std::string TextOf(std::span<const InfoSection> sections) {
+  std::string text;
+  for (const InfoSection& section : sections) {
+    text.append(section.title).append("\n");
+    for (const InfoLine& line : section.lines) {
+      text.append("    ");
+      if (!line.label.empty()) text.append(EscapeControls(line.label)).append(": ");
+      text.append(EscapeControls(line.value)).append("\n");
+    }
+  }
+  return text;
+}
+
+std::string TextOf(const FileInfo& file) {
+  std::string text = EscapeControls(file.path) + "\n";
+  if (!file.problem.empty()) text += file.problem + "\n";
+  return text + TextOf(file.sections);
+}
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,127 @@
+#include "desktop/windows/dialogs/plugin_box.h"
+
+#include <wx/button.h>
+#include <wx/dataview.h>
+#include <wx/msgdlg.h>
+#include <wx/sizer.h>
+#include <wx/stattext.h>
+
+#include "desktop/models/shell/event_log.h"
+#include "desktop/windows/widgets/looks.h"
+#include "desktop/windows/widgets/wx_text.h"
+#include "platform/folders.h"
+#include "platform/paths.h"
+#include "plugins/plugin_table.h"
+#include "registry/registry.h"
+#include "settings/configuration.h"
+#include "settings/settings.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+constexpr const char* kTitle = "Plug-ins";
+
+}  // namespace
+
+PluginBox::PluginBox(wxWindow* parent)
+    : wxDialog(parent, wxID_ANY, kTitle, wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
+               "PluginBox") {
+  const int gap = FromDIP(10);
+  list_ = new wxDataViewListCtrl(this, wxID_ANY, wxDefaultPosition, FromDIP(wxSize(820, 220)), wxDV_SINGLE | wxDV_ROW_LINES);
+  list_->SetName(kTitle);
+  list_->AppendToggleColumn("On", wxDATAVIEW_CELL_ACTIVATABLE, FromDIP(50), wxALIGN_CENTER);
+  struct Column {
+    const char* title;
+    int width;
+  };
+  for (const Column& column : {Column{"Extension", 90}, {"Plug-in", 140}, {"Formats", 200}, {"Can", 150}, {"Module", 150}}) {
+    list_->AppendTextColumn(column.title, wxDATAVIEW_CELL_INERT, TextWidth(*this, column.width));
+  }
+  const std::string folder = platform::JoinFolder(platform::ProgramFolder(), "plugin");
+  auto* place = new wxStaticText(this, wxID_ANY, Shown("Plug-ins lie in the folder " + folder), wxDefaultPosition, wxDefaultSize,
+                                 wxST_ELLIPSIZE_MIDDLE);
+  note_ = new wxStaticText(this, wxID_ANY, "A switch that is turned counts from the next start of the program on.");
+  auto* buttons = new wxBoxSizer(wxHORIZONTAL);
+  buttons->Add(new wxButton(this, wxID_PREFERENCES, "&Configure..."));
+  buttons->AddStretchSpacer();
+  buttons->Add(new wxButton(this, wxID_CANCEL, "Close"));
+  auto* column = new wxBoxSizer(wxVERTICAL);
+  column->Add(list_, wxSizerFlags(1).Expand().Border(wxALL, gap));
+  column->Add(place, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT, gap));
+  column->Add(note_, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxTOP, gap));
+  column->Add(buttons, wxSizerFlags().Expand().Border(wxALL, gap));
+  SetSizerAndFit(column);
+  Bind(
+      wxEVT_BUTTON, [this](wxCommandEvent&) { Configure(); }, wxID_PREFERENCES);
+  list_->Bind(wxEVT_DATAVIEW_ITEM_VALUE_CHANGED, [this](wxDataViewEvent& event) { Turn(list_->ItemToRow(event.GetItem())); });
+  list_->Bind(wxEVT_CHAR_HOOK, [this](wxKeyEvent& event) {
+    const int line = list_->GetSelectedRow();
+    if (event.GetKeyCode() != WXK_SPACE || line == wxNOT_FOUND) return event.Skip();
+    list_->SetToggleValue(!list_->GetToggleValue(static_cast<unsigned>(line), 0), static_cast<unsigned>(line), 0);
+    Turn(line);
+  });
+  list_->Bind(wxEVT_DATAVIEW_ITEM_ACTIVATED, [this](wxDataViewEvent&) { Configure(); });
+  FillList();
+  CentreOnParent();
+  list_->SetFocus();
+}
+
+void PluginBox::FillList() {
+  (void)PluginFormats();  // modules are loaded when somebody asks
+  for (const PluginModule& module : PluginModules()) AddModule(module);
+  int selected = lines_.empty() ? wxNOT_FOUND : 0;
+  for (size_t line = 0; line < lines_.size(); ++line) {
+    if (lines_[line].row >= 0 && lines_[line].row == settings.PluginConfigIndex) selected = static_cast<int>(line);
+  }
+  if (selected != wxNOT_FOUND) list_->SetCurrentItem(list_->RowToItem(selected));
+  FindWindow(wxID_PREFERENCES)->Enable(PluginFormatCount() > 0);
+  LogEvent("plugins", "lines=" + std::to_string(lines_.size()) + " formats=" + std::to_string(PluginFormatCount()));
+}
+
+// One line for each format of a module; one for a module that is not loaded.
+void PluginBox::AddModule(const PluginModule& module) {
+  const auto add = [&](int32_t row, std::string_view extension, std::string_view plugin, std::string_view formats,
+                       std::string_view can) {
+    wxVector<wxVariant> cells;
+    cells.push_back(module.on);
+    for (const std::string_view cell : {extension, plugin, formats, can, std::string_view(module.name)})
+      cells.push_back(Shown(cell));
+    list_->AppendItem(cells);
+    lines_.push_back({module.name, row});
+  };
+  bool loaded = false;
+  for (int32_t row = 0; row < PluginFormatCount(); ++row) {
+    const PluginEntry& entry = PluginRow(row);
+    if (platform::FileNameOf(entry.path) != module.name) continue;
+    std::string can = entry.exports.writeImage != nullptr ? "read and write" : "read";
+    if (entry.exports.configure != nullptr) can += ", settings";
+    add(row, entry.extension, entry.textA, entry.textB, can);
+    loaded = true;
+  }
+  if (!loaded) add(-1, {}, {}, {}, module.on ? "not usable here" : "switched off");
+}
+
+void PluginBox::Turn(int line) {
+  if (line == wxNOT_FOUND) return;
+  const std::string name = lines_[static_cast<size_t>(line)].module;
+  const bool on = list_->GetToggleValue(static_cast<unsigned>(line), 0);
+  for (unsigned other = 0; other < lines_.size(); ++other) {
+    if (lines_[other].module == name && list_->GetToggleValue(other, 0) != on) list_->SetToggleValue(on, other, 0);
+  }
+  for (const PluginModule& module : PluginModules()) {
+    if (module.name != name || module.on == on) continue;
+    const std::string_view problem = SaveMessage(SwitchPluginModule(name, on));
+    if (!problem.empty()) wxMessageBox(Shown(problem), kTitle, wxOK | wxICON_WARNING, this);
+    LogEvent("plugins", name + (on ? " on" : " off"));
+  }
+}
+
+void PluginBox::Configure() {
+  const int line = list_->GetSelectedRow();
+  if (line == wxNOT_FOUND) return;
+  const int32_t row = lines_[static_cast<size_t>(line)].row;
+  if (row < 0 || !ConfigurePlugin(row)) wxMessageBox(Shown(kNothingToConfigure), kTitle, wxOK | wxICON_INFORMATION, this);
+}
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,56 @@
+#include "desktop/windows/dialogs/select_dialog.h"
+
+#include <wx/button.h>
+#include <wx/dialog.h>
+#include <wx/radiobox.h>
+#include <wx/sizer.h>
+#include <wx/stattext.h>
+#include <wx/textctrl.h>
+
+#include "desktop/models/browser/browser_model.h"
+#include "desktop/models/shell/event_log.h"
+#include "desktop/windows/widgets/wx_text.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+wxString& LastPattern() {
+  static wxString pattern = "*.jpg";
+  return pattern;
+}
+
+}  // namespace
+
+bool AskAndSelect(wxWindow& parent, BrowserModel& model) {
+  wxDialog dialog(&parent, wxID_ANY, "Select by pattern", wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE, "SelectBox");
+  const int gap = dialog.FromDIP(10);
+  auto* sizer = new wxBoxSizer(wxVERTICAL);
+  sizer->Add(new wxStaticText(&dialog, wxID_ANY, "&Names that contain this, or match its * and ?:"),
+             wxSizerFlags().Border(wxALL, gap));
+  auto* pattern = new wxTextCtrl(&dialog, wxID_ANY, LastPattern(), wxDefaultPosition, dialog.FromDIP(wxSize(320, -1)), 0,
+                                 wxDefaultValidator, "Pattern");
+  sizer->Add(pattern, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT, gap));
+  const wxString modes[] = {"&Select only them", "&Add them", "&Take them out"};  // as MatchMode
+  auto* mode = new wxRadioBox(&dialog, wxID_ANY, "Selection", wxDefaultPosition, wxDefaultSize, 3, modes, 1, wxRA_SPECIFY_ROWS);
+  sizer->Add(mode, wxSizerFlags().Expand().Border(wxALL, gap));
+  auto* buttons = new wxBoxSizer(wxHORIZONTAL);
+  auto* ok = new wxButton(&dialog, wxID_OK, "S&elect");
+  buttons->AddStretchSpacer();
+  buttons->Add(new wxButton(&dialog, wxID_CANCEL), wxSizerFlags().Border(wxRIGHT, gap));
+  buttons->Add(ok);
+  sizer->Add(buttons, wxSizerFlags().Expand().Border(wxALL, gap));
+  dialog.SetSizerAndFit(sizer);
+  dialog.CentreOnParent();
+  ok->SetDefault();
+  pattern->Bind(wxEVT_TEXT, [&](wxCommandEvent&) { ok->Enable(!pattern->IsEmpty()); });
+  pattern->SetFocus();
+  pattern->SelectAll();
+  LogEvent("prompt", "select");
+  if (dialog.ShowModal() != wxID_OK) return false;
+  LastPattern() = pattern->GetValue();
+  model.SelectMatching(Utf8(pattern->GetValue()), static_cast<MatchMode>(mode->GetSelection()));
+  return true;
+}
+
+}  // namespace fotomill::desktop

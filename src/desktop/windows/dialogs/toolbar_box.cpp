@@ -1,0 +1,62 @@
+#include "desktop/windows/dialogs/toolbar_box.h"
+
+#include <wx/control.h>
+#include <wx/msgdlg.h>
+#include <wx/rearrangectrl.h>
+
+#include <algorithm>
+
+#include "desktop/models/shell/event_log.h"
+#include "desktop/windows/shell/commands.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+constexpr const char* kTitle = "Toolbar";
+
+std::vector<std::string> KnownButtons() {
+  std::vector<std::string> known;
+  for (const Command& command : Commands()) {
+    if (command.symbol != nullptr) known.emplace_back(command.symbol);
+  }
+  return known;
+}
+
+}  // namespace
+
+std::vector<ToolbarButton> ToolbarButtons() { return LoadToolbar(KnownButtons()); }
+
+bool AskForToolbar(wxWindow& parent) {
+  const std::vector<ToolbarButton> before = ToolbarButtons();
+  wxArrayInt order;
+  wxArrayString labels;
+  for (const ToolbarButton& button : before) {
+    const int place = static_cast<int>(labels.size());
+    order.push_back(button.shown ? place : ~place);  // as wxRearrangeList marks what is not checked
+    wxString label = wxControl::RemoveMnemonics(CommandOfSymbol(button.name)->text);
+    label.EndsWith("...", &label);
+    labels.push_back(label);
+  }
+  wxRearrangeDialog dialog(&parent, "Buttons of the toolbar, in their order:", kTitle, order, labels);
+  dialog.GetList()->SetName("Buttons");
+  dialog.GetList()->SetSelection(0);
+  dialog.GetList()->SetFocus();
+  // Space turns the mark of the selected line from the start; of itself the list does so only after an arrow key.
+  dialog.Bind(wxEVT_CHAR_HOOK, [list = dialog.GetList()](wxKeyEvent& event) {
+    const int line = list->GetSelection();
+    if (event.GetKeyCode() != WXK_SPACE || !list->HasFocus() || line == wxNOT_FOUND) return event.Skip();
+    list->Check(static_cast<unsigned>(line), !list->IsChecked(static_cast<unsigned>(line)));
+  });
+  LogEvent("prompt", "toolbar");
+  if (dialog.ShowModal() != wxID_OK) return false;
+  std::vector<ToolbarButton> buttons;
+  for (const int place : dialog.GetOrder()) {
+    buttons.push_back({before[static_cast<size_t>(place < 0 ? ~place : place)].name, place >= 0});
+  }
+  if (SaveToolbar(buttons)) return true;
+  wxMessageBox("The toolbar could not be saved in the data folder.", kTitle, wxOK | wxICON_WARNING, &parent);
+  return false;
+}
+
+}  // namespace fotomill::desktop

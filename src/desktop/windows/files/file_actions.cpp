@@ -1,0 +1,310 @@
+#include "desktop/windows/files/file_actions.h"
+
+#include <wx/clipbrd.h>
+#include <wx/dataobj.h>
+#include <wx/filename.h>
+#include <wx/filesys.h>
+#include <wx/image.h>
+#include <wx/msgdlg.h>
+#include <wx/textdlg.h>
+
+#include <algorithm>
+
+#include "core/plain_name.h"
+#include "desktop/models/files/pasted_picture.h"
+#include "desktop/models/files/previous_file.h"
+#include "desktop/models/shell/event_log.h"
+#include "desktop/windows/dialogs/folder_dialog.h"
+#include "desktop/windows/shell/main_frame.h"
+#include "desktop/windows/widgets/wx_text.h"
+#include "platform/files.h"
+#include "platform/paths.h"
+#include "settings/history_list.h"
+#include "settings/settings.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+PastedPicture PictureOf(const wxBitmap& bitmap) {
+  const wxImage image = bitmap.ConvertToImage();
+  const size_t count = static_cast<size_t>(image.GetWidth()) * static_cast<size_t>(image.GetHeight());
+  PastedPicture picture;
+  picture.pixels.width = image.GetWidth();
+  picture.pixels.height = image.GetHeight();
+  picture.pixels.bytes.assign(image.GetData(), image.GetData() + 3 * count);
+  if (image.HasAlpha()) picture.alpha.assign(image.GetAlpha(), image.GetAlpha() + count);
+  return picture;
+}
+
+constexpr const char* kGnomeFiles = "x-special/gnome-copied-files";  // "cut" or "copy", then a URL a line
+constexpr size_t kMostFailuresShown = 10;
+
+std::string Count(size_t files) { return files == 1 ? std::string("1 file") : std::to_string(files) + " files"; }
+
+}  // namespace
+
+FileActions::FileActions(MainFrame& frame)
+    : frame_(frame), undo_(static_cast<size_t>(std::clamp(settings.UndoLevels, 1, 1000))) {}
+
+FileActions::~FileActions() {
+  stop_ = true;
+  if (thread_.joinable()) thread_.join();
+}
+
+void FileActions::Run(const std::string& what, Work work, Then then) {
+  if (busy_) return frame_.Tell("Wait until the files before are done.");
+  if (thread_.joinable()) thread_.join();
+  busy_ = true;
+  stop_ = false;
+  thread_ = std::thread([this, what, work = std::move(work), then = std::move(then)] {
+    DeedResult result = work([this, &what](size_t index, size_t count) {
+      CallAfter([this, what, index, count] {
+        if (count > 1) frame_.Tell(what + ": " + std::to_string(index + 1) + " of " + std::to_string(count));
+      });
+      return !stop_;
+    });
+    CallAfter([this, what, result = std::move(result), then]() mutable { Finished(what, std::move(result), then); });
+  });
+}
+
+void FileActions::Finished(const std::string& what, DeedResult result, const Then& then) {
+  busy_ = false;
+  const std::string failed = result.failures.empty() ? "" : ", " + std::to_string(result.failures.size()) + " failed";
+  frame_.Tell(what + failed + (result.note.empty() ? "" : ": " + result.note));
+  LogEvent("files",
+           what + " done=" + std::to_string(result.done.steps.size()) + " failed=" + std::to_string(result.failures.size()));
+  const std::vector<DeedFailure> failures = result.failures;
+  then(std::move(result));
+  frame_.FilesChanged();
+  TellFailures(failures);
+}
+
+void FileActions::TellFailures(const std::vector<DeedFailure>& failures) {
+  if (failures.empty()) return;
+  wxString text;
+  for (size_t i = 0; i < std::min(failures.size(), kMostFailuresShown); ++i) {
+    text += Shown(platform::FileNameOf(failures[i].path)) + ": " + Shown(failures[i].reason) + "\n";
+  }
+  if (failures.size() > kMostFailuresShown) text += wxString::Format("and %zu more", failures.size() - kMostFailuresShown);
+  wxMessageBox(text, "Not everything could be done", wxOK | wxICON_WARNING, &frame_);
+}
+
+void FileActions::Do(DeedKind kind, const std::vector<std::string>& paths, const std::string& folder) {
+  if (paths.empty()) return;
+  FileDeed name{kind, std::vector<FileStep>(paths.size(), FileStep{paths.front(), {}})};
+  std::string what = DeedName(name);
+  what[0] = static_cast<char>(what[0] - 'a' + 'A');
+  Run(
+      what, [kind, paths, folder](const DeedProgress& progress) { return CarryOut(PlanDeed(kind, paths, folder), progress); },
+      [this](DeedResult result) {
+        Follow(result.done, false);
+        undo_.Add(std::move(result.done));
+      });
+}
+
+void FileActions::Follow(const FileDeed& deed, bool back) {
+  if (deed.kind != DeedKind::Rename && deed.kind != DeedKind::Move) return;
+  for (const FileStep& step : deed.steps) frame_.FollowRename(back ? step.to : step.from, back ? step.from : step.to);
+}
+
+bool FileActions::Trash(const std::vector<std::string>& paths) {
+  if (!paths.empty() && !platform::HasTrash(paths.front())) return Delete(paths);
+  Do(DeedKind::Trash, paths, {});
+  return true;
+}
+
+bool FileActions::TrashFromView(wxWindow* view, const std::string& path) {
+  if (busy_) {
+    wxBell();
+    return false;
+  }
+  if (settings.PromptDeleteFromView != 0) {
+    wxMessageDialog dialog(view, "Move " + Shown(platform::FileNameOf(path)) + " to the trash?", "Delete",
+                           wxOK | wxCANCEL | wxICON_QUESTION);
+    dialog.SetOKLabel("&Delete");
+    if (dialog.ShowModal() != wxID_OK) return false;
+  }
+  return Trash({path});
+}
+
+bool FileActions::Delete(const std::vector<std::string>& paths) {
+  if (paths.empty()) return false;
+  const wxString what = paths.size() == 1 ? "\"" + Shown(platform::FileNameOf(paths.front())) + "\"" : Shown(Count(paths.size()));
+  const wxString why = platform::HasTrash(paths.front()) ? wxString() : wxString("There is no trash for files of this folder.\n");
+  wxMessageDialog dialog(&frame_, why + "Delete " + what + " for good? This cannot be undone.", "Delete",
+                         wxOK | wxCANCEL | wxCANCEL_DEFAULT | wxICON_WARNING);
+  dialog.SetOKLabel("&Delete");
+  LogEvent("prompt", "delete");
+  if (dialog.ShowModal() != wxID_OK) return false;
+  Run(
+      "Deletion for good", [paths](const DeedProgress& progress) { return DeleteForGood(paths, progress); }, [](DeedResult) {});
+  return true;
+}
+
+void FileActions::CopyTo(const std::vector<std::string>& paths, const std::string& folder) { Do(DeedKind::Copy, paths, folder); }
+void FileActions::MoveTo(const std::vector<std::string>& paths, const std::string& folder) { Do(DeedKind::Move, paths, folder); }
+
+void FileActions::Rename(const std::string& path, const std::string& name) {
+  if (!IsPlainName(name)) {
+    wxMessageBox("A name cannot hold \"" + Shown(std::string(1, platform::kSeparator)) + "\".", "Rename", wxOK | wxICON_WARNING,
+                 &frame_);
+    return;
+  }
+  RenameAll({{path, platform::JoinFolder(platform::SplitPath(path).folder, name)}});
+}
+
+void FileActions::RenameAll(std::vector<FileStep> steps) {
+  if (steps.empty()) return;
+  FileDeed deed{DeedKind::Rename, std::move(steps)};
+  const std::string shown(platform::FileNameOf(deed.steps.front().to));
+  const bool one = deed.steps.size() == 1;
+  Run(
+      "Rename", [deed](const DeedProgress& progress) { return CarryOut(deed, progress); },
+      [this, one, shown](DeedResult result) {
+        const bool done = !result.done.steps.empty();
+        for (const FileStep& step : result.done.steps) {
+          frame_.NoteUses({FileUse{step.from, FileFunction::MoveAndCopy, kOwnTime, kOwnTime, true}});
+        }
+        Follow(result.done, false);
+        undo_.Add(std::move(result.done));
+        if (BrowserPage* browser = frame_.Browser(); one && done && browser != nullptr)
+          browser->Open(browser->Model().Folder(), shown);
+      });
+}
+
+void FileActions::NewFolder(const std::string& parent) {
+  wxTextEntryDialog dialog(&frame_, "Name of the new folder:", "New folder", wxString::FromUTF8(settings.NewFolderName.c_str()));
+  if (dialog.ShowModal() != wxID_OK) return;
+  const std::string name = Utf8(dialog.GetValue());
+  const std::string path = platform::JoinFolder(parent, name);
+  if (!IsPlainName(name) || name.empty() || platform::FileExists(path) || !platform::MakeFolders(path)) {
+    wxMessageBox("The folder could not be made.", "New folder", wxOK | wxICON_WARNING, &frame_);
+    return;
+  }
+  if (BrowserPage* browser = frame_.Browser(); browser != nullptr && browser->Model().Folder() == parent)
+    browser->Open(parent, name);
+  frame_.FilesChanged();
+}
+
+bool FileActions::SaveTurned(const std::string& path, Orientation turn, Turned then) {
+  if (busy_) return false;
+  const auto work = [path, turn](const DeedProgress&) { return TurnOneFile(path, turn); };
+  Run("Rotation of " + std::string(platform::FileNameOf(path)), work, [this, then = std::move(then)](DeedResult result) {
+    const bool done = !result.done.steps.empty();
+    const std::string note = result.note;
+    undo_.Add(std::move(result.done));
+    then(done, note);
+  });
+  return true;
+}
+
+// --- undo ---
+
+void FileActions::Undo() {
+  if (!undo_.CanUndo() || busy_) return;
+  const FileDeed deed = undo_.TakeUndo();
+  Run(
+      "Undo " + DeedName(deed), [deed](const DeedProgress& progress) { return TakeBack(deed, progress); },
+      [this](DeedResult result) {
+        Follow(result.done, true);
+        undo_.Undone(std::move(result.done));
+      });
+}
+
+void FileActions::Redo() {
+  if (!undo_.CanRedo() || busy_) return;
+  const FileDeed deed = undo_.TakeRedo();
+  Run(
+      "Redo " + DeedName(deed), [deed](const DeedProgress& progress) { return CarryOut(deed, progress); },
+      [this](DeedResult result) {
+        Follow(result.done, false);
+        undo_.Redone(std::move(result.done));
+      });
+}
+
+// --- clipboard ---
+
+void FileActions::ToClipboard(const std::vector<std::string>& paths, bool cut) {
+  if (paths.empty()) return;
+  auto* files = new wxFileDataObject;
+  std::string urls = cut ? "cut" : "copy";
+  for (const std::string& path : paths) {
+    const wxString name = wxString::FromUTF8(path);
+    files->AddFile(name);
+    urls += "\n" + Utf8(wxFileSystem::FileNameToURL(wxFileName(name)));
+  }
+  auto* marked = new wxCustomDataObject(wxDataFormat(kGnomeFiles));
+  marked->SetData(urls.size(), urls.data());
+  auto* both = new wxDataObjectComposite;
+  both->Add(files, true);
+  both->Add(marked);
+  const wxClipboardLocker clipboard;
+  if (!clipboard || !wxTheClipboard->SetData(both)) return wxBell();
+  frame_.Tell(Count(paths.size()) + (cut ? " cut" : " copied") + ".");
+}
+
+void FileActions::PathsToClipboard(const std::vector<std::string>& paths) {
+  wxString text;
+  for (const std::string& path : paths) text += (text.empty() ? "" : "\n") + wxString::FromUTF8(path);
+  const wxClipboardLocker clipboard;
+  if (!clipboard || !wxTheClipboard->SetData(new wxTextDataObject(text))) wxBell();
+}
+
+void FileActions::Paste(const std::string& folder) {
+  wxFileDataObject files;
+  wxCustomDataObject marked{wxDataFormat(kGnomeFiles)};
+  bool cut = false;
+  {
+    const wxClipboardLocker clipboard;
+    if (!clipboard) return wxBell();
+    if (!wxTheClipboard->GetData(files)) return PastePicture(folder);
+    if (wxTheClipboard->GetData(marked)) {
+      cut = std::string(static_cast<const char*>(marked.GetData()), marked.GetSize()).starts_with("cut");
+    }
+    if (cut) wxTheClipboard->Clear();  // they can be moved once only
+  }
+  std::vector<std::string> paths;
+  for (const wxString& name : files.GetFilenames()) paths.push_back(Utf8(name));
+  Do(cut ? DeedKind::Move : DeedKind::Copy, paths, folder);
+}
+
+// With the clipboard open.
+void FileActions::PastePicture(const std::string& folder) {
+  wxBitmapDataObject bitmap;
+  if (!wxTheClipboard->GetData(bitmap) || !bitmap.GetBitmap().IsOk()) {
+    return frame_.Tell("There are no files and no picture on the clipboard.");
+  }
+  Run(
+      "Paste",
+      [picture = PictureOf(bitmap.GetBitmap()), folder](const DeedProgress&) { return KeepPastedPicture(picture, folder); },
+      [this](DeedResult result) {
+        const std::vector<FileStep> made = result.done.steps;
+        undo_.Add(std::move(result.done));
+        BrowserPage* const browser = frame_.Browser();
+        if (browser != nullptr && !made.empty())
+          browser->Open(browser->Model().Folder(), std::string(platform::FileNameOf(made[0].to)));
+      });
+}
+
+// --- functions of the menu ---
+
+void TrashSelection(MainFrame& frame) { frame.Files().Trash(frame.SelectedPaths()); }
+void DeleteSelection(MainFrame& frame) { frame.Files().Delete(frame.SelectedPaths()); }
+
+namespace {
+
+void AskAndDo(MainFrame& frame, const wxString& verb,
+              void (FileActions::*action)(const std::vector<std::string>&, const std::string&)) {
+  const std::vector<std::string> paths = frame.SelectedPaths();
+  if (paths.empty()) return;
+  const auto folder = AskForFolder(frame, verb + " " + Shown(Count(paths.size())) + " to", verb, HistoryList::MoveCopy);
+  if (folder) (frame.Files().*action)(paths, *folder);
+}
+
+}  // namespace
+
+void CopySelectionTo(MainFrame& frame) { AskAndDo(frame, "Copy", &FileActions::CopyTo); }
+void MoveSelectionTo(MainFrame& frame) { AskAndDo(frame, "Move", &FileActions::MoveTo); }
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,57 @@
+#include "desktop/windows/files/folder_drop.h"
+
+#include <wx/app.h>
+#include <wx/msgdlg.h>
+#include <wx/utils.h>
+
+#include "core/choice_lists.h"
+#include "desktop/windows/widgets/wx_text.h"
+#include "platform/paths.h"
+#include "settings/settings.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+enum class DropKind { Move, Copy, Ask };
+
+DropKind KindNow() {
+  if (wxGetKeyState(WXK_SHIFT)) return DropKind::Move;
+  if (wxGetKeyState(WXK_CONTROL)) return DropKind::Copy;
+  if (settings.DropOptions == choice::kDropCopy) return DropKind::Copy;
+  return settings.DropOptions == choice::kDropAsk ? DropKind::Ask : DropKind::Move;
+}
+
+// nullopt-like: 1 move, 0 copy, -1 neither.
+int AskKind(const std::string& folder) {
+  wxMessageDialog dialog(nullptr, "Move or copy the files to " + Shown(folder) + "?", "Drop",
+                         wxYES_NO | wxCANCEL | wxICON_QUESTION);
+  dialog.SetYesNoLabels("&Move", "&Copy");
+  const int answer = dialog.ShowModal();
+  return answer == wxID_YES ? 1 : answer == wxID_NO ? 0 : -1;
+}
+
+}  // namespace
+
+wxDragResult FolderDrop::OnDragOver(wxCoord x, wxCoord y, wxDragResult) {
+  if (folderAt_(wxPoint(x, y)).empty()) return wxDragNone;
+  return KindNow() == DropKind::Move ? wxDragMove : wxDragCopy;
+}
+
+bool FolderDrop::OnDropFiles(wxCoord x, wxCoord y, const wxArrayString& names) {
+  const std::string folder = folderAt_(wxPoint(x, y));
+  if (folder.empty() || names.empty()) return false;
+  std::vector<std::string> files;
+  for (const wxString& name : names) files.push_back(Utf8(name));
+  // What lies there already stays.
+  if (platform::SplitPath(files.front()).folder == platform::JoinFolder(folder, "")) return false;
+  const DropKind kind = KindNow();
+  // The drag is over before anything is asked or done.
+  wxTheApp->CallAfter([dropped = dropped_, files = std::move(files), folder, kind] {
+    const int move = kind == DropKind::Ask ? AskKind(folder) : kind == DropKind::Move ? 1 : 0;
+    if (move >= 0) dropped(files, folder, move == 1);
+  });
+  return true;
+}
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,235 @@
+#include "desktop/windows/files/sequential_rename_dialog.h"
+
+#include <wx/app.h>
+#include <wx/button.h>
+#include <wx/checkbox.h>
+#include <wx/combobox.h>
+#include <wx/dialog.h>
+#include <wx/listctrl.h>
+#include <wx/sizer.h>
+#include <wx/spinctrl.h>
+#include <wx/stattext.h>
+#include <wx/wrapsizer.h>
+
+#include <optional>
+
+#include "batch/progress_box.h"
+#include "batch/sequential_rename.h"
+#include "core/plain_name.h"
+#include "desktop/models/shell/event_log.h"
+#include "desktop/windows/batch/batch_runner.h"
+#include "desktop/windows/dialogs/help.h"
+#include "desktop/windows/files/file_actions.h"
+#include "desktop/windows/shell/main_frame.h"
+#include "desktop/windows/widgets/looks.h"
+#include "desktop/windows/widgets/wx_text.h"
+#include "files/rename_log.h"
+#include "platform/paths.h"
+#include "settings/configuration.h"
+#include "settings/history_list.h"
+#include "settings/settings.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+constexpr size_t kMostPreviewed = 200;
+constexpr int kMostNumber = 32760, kMostIncrement = 1000;
+
+// Keeps what a run would do instead of showing it.
+class PreviewBox : public ProgressBox {
+ public:
+  std::vector<FileOutcome> outcomes;
+  bool Open(const ProgressModel&) override { return true; }
+  void ShowLine(const ProgressLine&, const FileOutcome* outcome) override {
+    if (outcome != nullptr) outcomes.push_back(*outcome);
+  }
+  void ShowStatus(const std::string&) override {}
+  void StayOpen(const ProgressModel&) override {}
+  void Close(const ProgressModel&) override {}
+};
+
+struct FlagBox {
+  KeyNumber key;
+  const char* text;
+};
+constexpr FlagBox kFlags[] = {
+    {KeyNumber::SequentialRenameSkipCollide, "&Skip colliding files"},
+    {KeyNumber::SequentialRenameUpdate, "&Update base number"},
+    {KeyNumber::SequentialRenamePrefix, "&Prefix"},
+    {KeyNumber::SequentialRenameRandom, "&Random"},
+    {KeyNumber::SequentialRenameHyphen, "&Hyphen"},
+};
+
+std::vector<BatchFile> BatchFiles(const std::vector<std::string>& files, size_t most) {
+  std::vector<BatchFile> batch;
+  for (size_t i = 0; i < std::min(files.size(), most); ++i) batch.push_back({.name = files[i], .below = {}, .hint = {}});
+  return batch;
+}
+
+class SequentialRenameDialog : public wxDialog {
+ public:
+  SequentialRenameDialog(wxWindow* parent, const std::vector<std::string>& files);
+  // Whether the user wants it; the settings hold what was chosen then, and are as before otherwise.
+  bool Ask();
+
+ private:
+  void TakeControls();
+  void UpdateControls();
+
+  const std::vector<std::string>& files_;
+  const Settings before_ = settings;
+  wxComboBox* base_ = nullptr;
+  wxSpinCtrl* number_ = nullptr;
+  wxSpinCtrl* increment_ = nullptr;
+  wxCheckBox* flags_[std::size(kFlags)] = {};
+  wxListCtrl* preview_ = nullptr;
+  wxStaticText* problem_ = nullptr;
+  wxButton* ok_ = nullptr;
+};
+
+SequentialRenameDialog::SequentialRenameDialog(wxWindow* parent, const std::vector<std::string>& files)
+    : wxDialog(parent, wxID_ANY, "Sequential Rename", wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
+               "SequentialRenameBox"),
+      files_(files) {
+  const int gap = FromDIP(8);
+  auto* grid = new wxFlexGridSizer(2, gap, gap);
+  grid->AddGrowableCol(1);
+  const auto label = [&](const char* text) {
+    grid->Add(new wxStaticText(this, wxID_ANY, text), wxSizerFlags().CenterVertical());
+  };
+  label("&Base name:");
+  base_ = new wxComboBox(this, wxID_ANY, wxString::FromUTF8(settings.SequentialRenameBaseName.c_str()), wxDefaultPosition,
+                         FromDIP(wxSize(300, -1)), 0, nullptr, 0, wxDefaultValidator, "Base name");
+  for (const std::string& entry : LoadHistoryList(HistoryList::RenameBases)) {
+    if (entry != kDefaultEntry) base_->Append(wxString::FromUTF8(entry));
+  }
+  grid->Add(base_, wxSizerFlags(1).Expand());
+  const auto spin = [&](const char* name, int least, int most, int value) {
+    auto* control =
+        new wxSpinCtrl(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxSP_ARROW_KEYS, least, most, value, name);
+    grid->Add(control);
+    control->Bind(wxEVT_SPINCTRL, [this](wxSpinEvent&) { UpdateControls(); });
+    return control;
+  };
+  label("Base &number:");
+  number_ = spin("Base number", 0, kMostNumber, settings.SequentialRenameBaseNumber);
+  label("&Increment:");
+  increment_ = spin("Increment", 1, kMostIncrement, settings.SequentialRenameIncrement);
+
+  auto* sizer = new wxBoxSizer(wxVERTICAL);
+  sizer->Add(grid, wxSizerFlags().Expand().Border(wxALL, gap));
+  auto* flags = new wxWrapSizer(wxHORIZONTAL);
+  for (size_t i = 0; i < std::size(kFlags); ++i) {
+    flags_[i] = new wxCheckBox(this, wxID_ANY, kFlags[i].text);
+    flags_[i]->SetValue(NumberIn(KeyOf(kFlags[i].key)) != 0);
+    flags_[i]->Bind(wxEVT_CHECKBOX, [this](wxCommandEvent&) { UpdateControls(); });
+    flags->Add(flags_[i], wxSizerFlags().Border(wxRIGHT | wxBOTTOM, gap));
+  }
+  sizer->Add(flags, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT, gap));
+  preview_ = new wxListCtrl(this, wxID_ANY, wxDefaultPosition, wxSize(TextWidth(*this, 520), FromDIP(220)),
+                            wxLC_REPORT | wxLC_SINGLE_SEL, wxDefaultValidator, "New names");
+  preview_->AppendColumn("Old name", wxLIST_FORMAT_LEFT, TextWidth(*this, 250));
+  preview_->AppendColumn("New name", wxLIST_FORMAT_LEFT, TextWidth(*this, 250));
+  sizer->Add(preview_, wxSizerFlags(1).Expand().Border(wxLEFT | wxRIGHT, gap));
+  problem_ = new wxStaticText(this, wxID_ANY, "");
+  sizer->Add(problem_, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxTOP, gap));
+  auto* buttons = new wxBoxSizer(wxHORIZONTAL);
+  auto* help = new wxButton(this, wxID_HELP);
+  help->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { ShowHelp(*this, "RENAME"); });
+  ok_ = new wxButton(this, wxID_OK,
+                     files_.size() == 1 ? wxString("Rename &1 file") : wxString::Format("Rename &%zu files", files_.size()));
+  buttons->Add(help);
+  buttons->AddStretchSpacer();
+  buttons->Add(new wxButton(this, wxID_CANCEL), wxSizerFlags().Border(wxRIGHT, gap));
+  buttons->Add(ok_);
+  sizer->Add(buttons, wxSizerFlags().Expand().Border(wxALL, gap));
+  ok_->SetDefault();
+  SetSizerAndFit(sizer);
+  CentreOnParent();
+  base_->Bind(wxEVT_TEXT, [this](wxCommandEvent&) { UpdateControls(); });
+  base_->Bind(wxEVT_COMBOBOX, [this](wxCommandEvent&) { UpdateControls(); });
+  UpdateControls();
+  base_->SetFocus();
+}
+
+void SequentialRenameDialog::TakeControls() {
+  settings.SequentialRenameBaseName.AssignCut(Utf8(base_->GetValue()));
+  settings.SequentialRenameBaseNumber = number_->GetValue();
+  settings.SequentialRenameIncrement = increment_->GetValue();
+  for (size_t i = 0; i < std::size(kFlags); ++i) StoreNumber(KeyOf(kFlags[i].key), flags_[i]->GetValue() ? 1 : 0);
+}
+
+// The new names as a run would give them now; nothing is renamed.
+void SequentialRenameDialog::UpdateControls() {
+  const std::string base = Utf8(base_->GetValue());
+  base_->Enable(!flags_[2]->GetValue());  // with the number in front every file keeps its own name behind it
+  const bool plain = IsPlainName(base) && !base.empty();
+  ok_->Enable(plain || flags_[2]->GetValue());
+  if (!plain) return problem_->SetLabel("The base name is a part of a file name.");
+  TakeControls();
+  PreviewBox box;
+  BatchJob job;
+  job.box = &box;
+  job.rename = SequentialRenameFromSettings();
+  const std::vector<BatchFile> files = BatchFiles(files_, kMostPreviewed);
+  RunRename(files, {.seed = 1, .dryRun = true, .storeNumber = [](uint32_t) {}}, job);
+  settings.SequentialRenameBaseNumber = number_->GetValue();
+  preview_->Freeze();
+  preview_->DeleteAllItems();
+  size_t failed = 0;
+  for (const FileOutcome& outcome : box.outcomes) {
+    const long row = preview_->InsertItem(preview_->GetItemCount(), Shown(platform::FileNameOf(outcome.source)));
+    const bool bad = outcome.status != Status::Ok || outcome.skipped;
+    failed += bad ? 1 : 0;
+    preview_->SetItem(row, 1, bad ? wxString("stays as it is") : Shown(platform::FileNameOf(outcome.destination)));
+    if (bad) preview_->SetItemTextColour(row, ToWx(CurrentPalette().fault));
+  }
+  preview_->Thaw();
+  problem_->SetLabel(failed == 0 ? wxString() : wxString::Format("%zu of the files shown cannot get a new name.", failed));
+}
+
+bool SequentialRenameDialog::Ask() {
+  if (ShowModal() != wxID_OK) {
+    settings = before_;
+    return false;
+  }
+  TakeControls();
+  (void)AddToHistoryList(HistoryList::RenameBases, settings.SequentialRenameBaseName);
+  return true;
+}
+
+// What the last run renamed, for the frame's undo.
+void NoteRenames(MainFrame& frame) {
+  FileDeed deed{DeedKind::Rename, {}};
+  for (const RenamedFile& file : ReadRenameLog().value_or(std::vector<RenamedFile>())) deed.steps.push_back({file.from, file.to});
+  frame.Files().NoteDone(std::move(deed));
+}
+
+}  // namespace
+
+void RenameSelectionSequentially(MainFrame& frame) {
+  const std::vector<std::string> files = frame.SelectedFiles();
+  if (files.empty()) return;
+  SequentialRenameDialog dialog(&frame, files);
+  LogEvent("prompt", "sequential-rename");
+  if (!dialog.Ask()) return;
+  (void)SaveConfiguration();
+  RenameOptions options;
+  options.storeNumber = [](uint32_t next) {
+    wxTheApp->CallAfter([next] {
+      SettingValue number;
+      number.number = static_cast<int32_t>(next);
+      (void)StoreSetting(KeyOf(KeyNumber::SequentialRenameBaseNumber), number);
+    });
+  };
+  BatchJob job;
+  job.rename = SequentialRenameFromSettings();
+  frame.Batches().Run(std::move(job), [batch = BatchFiles(files, files.size()), options, &frame](BatchJob& running) {
+    RunRename(batch, options, running);
+    frame.CallAfter([&frame] { NoteRenames(frame); });
+    return Status::Ok;
+  });
+}
+
+}  // namespace fotomill::desktop

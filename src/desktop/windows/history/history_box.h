@@ -1,0 +1,51 @@
+#pragma once
+
+#include <wx/dialog.h>
+
+#include <string>
+
+#include "desktop/models/history/file_history_list.h"
+#include "desktop/windows/history/history_thumbnails.h"
+
+class wxDataViewCtrl;
+class wxStaticText;
+
+namespace fotomill::desktop {
+
+class MainFrame;
+
+// The file history: which files were used last, for what, and when.
+class FileHistoryBox : public wxDialog {
+ public:
+  explicit FileHistoryBox(MainFrame& frame);
+  ~FileHistoryBox() override;
+
+ private:
+  class Lines;
+  void BuildList();
+  wxSizer* BuildButtons();
+  void AddColumns();
+  void Refill();
+  void UpdateControls();
+  std::vector<size_t> SelectedRows() const;
+  void ViewFile();
+  void ShowFolder();
+  void RemoveSelected();
+  void ClearAll();
+  void Options();
+  bool Confirm(const wxString& question, const wxString& verb);
+  void KeepPlaces();
+
+  MainFrame& frame_;
+  FileHistoryList history_;
+  bool readable_ = true;
+  HistoryThumbnails thumbnails_;
+  wxDataViewCtrl* list_ = nullptr;
+  wxStaticText* count_ = nullptr;
+  wxObjectDataPtr<Lines> lines_;
+};
+
+// The settings of the file history in a box of their own. True when they were confirmed.
+bool ShowFileHistorySetup(wxWindow* parent);
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,67 @@
+#include "desktop/windows/history/history_thumbnails.h"
+
+#include <wx/dcmemory.h>
+#include <wx/image.h>
+
+#include <cstring>
+
+#include "core/choice_lists.h"
+#include "desktop/models/history/file_history_list.h"
+#include "platform/files.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+// A picture in the middle of a square that shows what is behind it.
+wxBitmapBundle OnSquare(const RgbImage& pixels, int side, double scale) {
+  wxImage square(side, side);
+  square.InitAlpha();
+  std::memset(square.GetAlpha(), 0, static_cast<size_t>(side) * static_cast<size_t>(side));
+  const int left = (side - pixels.width) / 2, top = (side - pixels.height) / 2;
+  for (int y = 0; y < pixels.height && pixels.width <= side && pixels.height <= side; ++y) {
+    const size_t place = static_cast<size_t>(top + y) * static_cast<size_t>(side) + static_cast<size_t>(left);
+    std::memcpy(square.GetData() + 3 * place, pixels.Row(y), static_cast<size_t>(pixels.width) * 3);
+    std::memset(square.GetAlpha() + place, 255, static_cast<size_t>(pixels.width));
+  }
+  wxBitmap bitmap(square);
+  bitmap.SetScaleFactor(scale);
+  return wxBitmapBundle(bitmap);
+}
+
+}  // namespace
+
+HistoryThumbnails::HistoryThumbnails(std::function<void(const std::vector<std::string>&)> came)
+    : came_(std::move(came)), loader_(1, [this] { CallAfter([this] { Take(); }); }) {}
+
+void HistoryThumbnails::Want(const std::vector<std::string>& paths, int side, double scale) {
+  if (side != side_) bitmaps_.clear();
+  side_ = side;
+  scale_ = scale;
+  empty_ = side == 0 ? wxBitmapBundle() : OnSquare({}, side, scale);
+  std::vector<ThumbnailWish> wishes;
+  for (const std::string& path : paths) {
+    if (side == 0 || bitmaps_.contains(path) || !GetsThumbnail(path)) continue;
+    const platform::FileFacts facts = platform::FactsOf(path);
+    if (facts.kind != platform::FileKind::Regular) continue;
+    wishes.push_back({path, facts.modified, facts.size, side, choice::kDiskBased});
+  }
+  loader_.Want(std::move(wishes));
+}
+
+const wxBitmapBundle& HistoryThumbnails::Find(const std::string& path) const {
+  const auto found = bitmaps_.find(path);
+  return found == bitmaps_.end() ? empty_ : found->second;
+}
+
+void HistoryThumbnails::Take() {
+  std::vector<std::string> paths;
+  for (const ThumbnailLoader::Result& result : loader_.TakeResults()) {
+    if (result.wish.side != side_ || result.thumbnail == nullptr || result.thumbnail->pixels.Empty()) continue;
+    bitmaps_[result.wish.path] = OnSquare(result.thumbnail->pixels, side_, scale_);
+    paths.push_back(result.wish.path);
+  }
+  if (!paths.empty()) came_(paths);
+}
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,121 @@
+#include "desktop/windows/info/exif_frame.h"
+
+#include <wx/accel.h>
+#include <wx/dataview.h>
+#include <wx/filedlg.h>
+#include <wx/msgdlg.h>
+#include <wx/panel.h>
+#include <wx/sizer.h>
+#include <wx/statbmp.h>
+#include <wx/stattext.h>
+
+#include "core/text.h"
+#include "desktop/models/shell/event_log.h"
+#include "desktop/windows/info/text_actions.h"
+#include "desktop/windows/widgets/bitmaps.h"
+#include "desktop/windows/widgets/button_row.h"
+#include "desktop/windows/widgets/looks.h"
+#include "desktop/windows/widgets/wx_text.h"
+#include "platform/files.h"
+#include "platform/paths.h"
+
+namespace fotomill::desktop {
+
+ExifFrame::ExifFrame(wxWindow* parent, const std::string& path)
+    : wxFrame(parent, wxID_ANY, "EXIF: " + Shown(platform::FileNameOf(path)), wxDefaultPosition, wxDefaultSize,
+              wxDEFAULT_FRAME_STYLE | wxFRAME_FLOAT_ON_PARENT, "ExifBox"),
+      path_(path) {
+  const int gap = FromDIP(10);
+  auto* panel = new wxPanel(this);
+  problem_ = new wxStaticText(panel, wxID_ANY, "Reading...");
+  list_ = new wxDataViewListCtrl(panel, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxDV_SINGLE | wxDV_ROW_LINES);
+  list_->SetName("EXIF values");
+  list_->AppendTextColumn("Name", wxDATAVIEW_CELL_INERT, TextWidth(*this, 270));
+  list_->AppendTextColumn("Value", wxDATAVIEW_CELL_INERT, TextWidth(*this, 330));
+  thumbnail_ = new wxStaticBitmap(panel, wxID_ANY, wxBitmapBundle());
+  thumbnailFacts_ = new wxStaticText(panel, wxID_ANY, wxEmptyString);
+
+  auto* side = new wxBoxSizer(wxVERTICAL);
+  side->Add(thumbnail_);
+  side->Add(thumbnailFacts_, wxSizerFlags().Border(wxTOP, FromDIP(6)));
+  auto* middle = new wxBoxSizer(wxHORIZONTAL);
+  middle->Add(list_, wxSizerFlags(1).Expand());
+  middle->Add(side, wxSizerFlags().Border(wxLEFT, gap));
+
+  const RowButton rows[] = {
+      {wxID_COPY, "&Copy value", [this] { CopyText(SelectedValue()); }},
+      {wxID_SELECTALL, "Copy &all", [this] { CopyText(wxString::FromUTF8(report_.text)); }},
+      {wxID_SAVEAS, "&Save as text...", [this] { SaveTextAs(*this, "exif.txt", report_.text); }},
+      {wxID_SAVE, "Save &thumbnail...", [this] { SaveThumbnail(); }},
+      {wxID_PRINT, "&Print...", [this] { PrintText(*this, GetTitle(), report_.text); }},
+      {wxID_CLOSE, "C&lose", [this] { Close(); }},
+  };
+  wxSizer* buttons = BuildButtonRow(*this, *panel, rows);
+  for (const RowButton& row : rows) FindWindow(row.id)->Enable(row.id == wxID_CLOSE);  // until the file is read
+  auto* column = new wxBoxSizer(wxVERTICAL);
+  column->Add(problem_, wxSizerFlags().Expand().Border(wxLEFT | wxTOP | wxRIGHT, gap));
+  column->Add(middle, wxSizerFlags(1).Expand().Border(wxALL, gap));
+  column->Add(buttons, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, gap));
+  panel->SetSizer(column);
+  wxAcceleratorEntry keys[] = {{wxACCEL_CTRL, 'C', wxID_COPY},           {wxACCEL_CTRL | wxACCEL_SHIFT, 'C', wxID_SELECTALL},
+                               {wxACCEL_CTRL, 'S', wxID_SAVEAS},         {wxACCEL_CTRL, 'P', wxID_PRINT},
+                               {wxACCEL_NORMAL, WXK_ESCAPE, wxID_CLOSE}, {wxACCEL_CTRL, 'W', wxID_CLOSE}};
+  SetAcceleratorTable(wxAcceleratorTable(static_cast<int>(std::size(keys)), keys));
+  SetSize(FromDIP(wxSize(880, 620)));
+  CentreOnParent();
+  list_->SetFocus();
+  work_.Start(
+      *this, [this](const std::atomic<bool>&) { report_ = ReadExifReport(path_); }, [this] { Finished(); });
+}
+
+void ExifFrame::Finished() {
+  problem_->SetLabel(Shown(report_.problem));
+  problem_->Show(!report_.problem.empty());
+  for (const ExifRow& row : report_.rows) {
+    wxVector<wxVariant> cells;
+    cells.push_back((row.heading ? wxString() : wxString("    ")) + Shown(row.name));
+    cells.push_back(wxString::FromUTF8(row.text));
+    list_->AppendItem(cells);
+  }
+  if (!report_.rows.empty()) list_->SelectRow(0);
+  if (!report_.thumbnail.Empty()) {
+    thumbnail_->SetBitmap(BitmapOf(report_.thumbnail, GetContentScaleFactor()));
+    thumbnail_->SetName("Thumbnail in the EXIF block");
+  }
+  if (!report_.thumbnailBytes.empty()) {
+    const std::string size = report_.thumbnail.Empty()
+                                 ? "Thumbnail that cannot be decoded"
+                                 : std::to_string(report_.thumbnail.width) + " x " + std::to_string(report_.thumbnail.height);
+    thumbnailFacts_->SetLabel(wxString::FromUTF8(size + "\n" + WithThousands(report_.thumbnailBytes.size()) + " bytes"));
+  }
+  for (const wxWindowID id : {wxID_COPY, wxID_SELECTALL, wxID_SAVEAS, wxID_PRINT}) FindWindow(id)->Enable(!report_.rows.empty());
+  FindWindow(wxID_SAVE)->Enable(!report_.thumbnailBytes.empty());
+  list_->GetParent()->Layout();
+  LogEvent("exif", "rows=" + std::to_string(report_.rows.size()) + " thumbnail=" + std::to_string(report_.thumbnail.width));
+}
+
+wxString ExifFrame::SelectedValue() const {
+  const int row = list_->GetSelectedRow();
+  if (row == wxNOT_FOUND) return {};
+  const ExifRow& shown = report_.rows[static_cast<size_t>(row)];
+  return wxString::FromUTF8(shown.heading ? shown.name : shown.text);
+}
+
+void ExifFrame::SaveThumbnail() {
+  const std::string name = std::string(platform::SplitPath(path_).base) + "_thumbnail.jpg";
+  wxFileDialog dialog(this, "Save thumbnail", wxEmptyString, Shown(name), "JPEG files (*.jpg)|*.jpg",
+                      wxFD_SAVE | wxFD_OVERWRITE_PROMPT);
+  if (dialog.ShowModal() != wxID_OK) return;
+  const std::string target = Utf8(dialog.GetPath());
+  const platform::FileFacts own = platform::FactsOf(path_), other = platform::FactsOf(target);
+  const bool itself = other.kind == platform::FileKind::Regular && own.device == other.device && own.identity == other.identity;
+  const std::string_view bytes(reinterpret_cast<const char*>(report_.thumbnailBytes.data()), report_.thumbnailBytes.size());
+  if (itself) {
+    wxMessageBox("That is the picture itself. Choose another name.", "Save thumbnail", wxOK | wxICON_WARNING, this);
+  } else if (!platform::WriteWholeFile(target, bytes)) {
+    wxMessageBox("The file \"" + dialog.GetPath() + "\" could not be written. Choose another folder or name.", "Save thumbnail",
+                 wxOK | wxICON_WARNING, this);
+  }
+}
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,35 @@
+#pragma once
+
+#include <wx/frame.h>
+
+#include <string>
+
+#include "desktop/models/info/exif_report.h"
+#include "desktop/windows/shell/background.h"
+
+class wxDataViewListCtrl;
+class wxStaticBitmap;
+class wxStaticText;
+
+namespace fotomill::desktop {
+
+// The EXIF viewer: the lines of the walk as a list, and the thumbnail that the block holds.
+class ExifFrame : public wxFrame {
+ public:
+  ExifFrame(wxWindow* parent, const std::string& path);
+
+ private:
+  void Finished();
+  void SaveThumbnail();
+  wxString SelectedValue() const;
+
+  const std::string path_;
+  ExifReport report_;
+  wxStaticText* problem_ = nullptr;
+  wxDataViewListCtrl* list_ = nullptr;
+  wxStaticBitmap* thumbnail_ = nullptr;
+  wxStaticText* thumbnailFacts_ = nullptr;
+  Background work_;  // last, so that it ends first
+};
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,132 @@
+#include "desktop/windows/info/info_frame.h"
+
+#include <wx/accel.h>
+#include <wx/listbox.h>
+#include <wx/panel.h>
+#include <wx/sizer.h>
+#include <wx/splitter.h>
+#include <wx/stattext.h>
+
+#include "catalog/history/file_history.h"
+#include "desktop/models/shell/event_log.h"
+#include "desktop/windows/info/report_tree.h"
+#include "desktop/windows/info/text_actions.h"
+#include "desktop/windows/shell/main_frame.h"
+#include "desktop/windows/widgets/button_row.h"
+#include "desktop/windows/widgets/wx_text.h"
+#include "platform/paths.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+wxString TitleOf(const std::vector<std::string>& paths) {
+  if (paths.size() == 1) return "Get info: " + Shown(platform::FileNameOf(paths.front()));
+  return wxString::Format("Get info: %zu files", paths.size());
+}
+
+constexpr int kProgressMs = 200;
+
+}  // namespace
+
+InfoFrame::InfoFrame(MainFrame& frame, wxWindow* parent, std::vector<std::string> paths)
+    : wxFrame(parent, wxID_ANY, TitleOf(paths), wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE | wxFRAME_FLOAT_ON_PARENT,
+              "InfoBox"),
+      frame_(frame),
+      paths_(std::move(paths)) {
+  const int gap = FromDIP(10);
+  auto* panel = new wxPanel(this);
+  auto* column = new wxBoxSizer(wxVERTICAL);
+  problem_ = new wxStaticText(panel, wxID_ANY, "Reading...");
+  column->Add(problem_, wxSizerFlags().Expand().Border(wxLEFT | wxTOP | wxRIGHT, gap));
+  if (paths_.size() == 1) {
+    tree_ = new ReportTree(panel);
+    column->Add(tree_, wxSizerFlags(1).Expand().Border(wxALL, gap));
+  } else {
+    auto* splitter = new wxSplitterWindow(panel, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxSP_LIVE_UPDATE | wxSP_NOBORDER);
+    list_ = new wxListBox(splitter, wxID_ANY);
+    list_->SetName("Files");
+    tree_ = new ReportTree(splitter);
+    splitter->SetMinimumPaneSize(FromDIP(80));
+    splitter->SplitVertically(list_, tree_, FromDIP(220));
+    column->Add(splitter, wxSizerFlags(1).Expand().Border(wxALL, gap));
+    list_->Bind(wxEVT_LISTBOX, [this](wxCommandEvent&) { ShowChoice(); });
+  }
+  column->Add(BuildButtons(*panel), wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, gap));
+  panel->SetSizer(column);
+  SetSize(FromDIP(paths_.size() == 1 ? wxSize(700, 560) : wxSize(900, 560)));
+  CentreOnParent();
+  tree_->SetFocus();
+
+  timer_.Bind(wxEVT_TIMER, [this](wxTimerEvent&) {
+    problem_->SetLabel(wxString::Format("Reading file %zu of %zu...", read_.load() + 1, paths_.size()));
+  });
+  timer_.Start(kProgressMs);
+  work_.Start(
+      *this,
+      [this](const std::atomic<bool>& stop) {
+        for (const std::string& path : paths_) {
+          if (stop) return;
+          files_.push_back(ReadFileInfo(path));
+          ++read_;
+        }
+        summary_ = SummaryOf(files_);
+      },
+      [this] { Finished(); });
+}
+
+wxSizer* InfoFrame::BuildButtons(wxWindow& panel) {
+  const RowButton rows[] = {
+      {wxID_COPY, "&Copy value", [this] { CopyText(tree_->SelectedValue()); }},
+      {wxID_SELECTALL, "Copy &all", [this] { CopyText(wxString::FromUTF8(WholeText())); }},
+      {wxID_SAVE, "&Save as text...", [this] { SaveTextAs(*this, "info.txt", WholeText()); }},
+      {wxID_CLOSE, "C&lose", [this] { Close(); }},
+  };
+  wxAcceleratorEntry keys[] = {{wxACCEL_CTRL, 'C', wxID_COPY},
+                               {wxACCEL_CTRL | wxACCEL_SHIFT, 'C', wxID_SELECTALL},
+                               {wxACCEL_CTRL, 'S', wxID_SAVE},
+                               {wxACCEL_NORMAL, WXK_ESCAPE, wxID_CLOSE},
+                               {wxACCEL_CTRL, 'W', wxID_CLOSE}};
+  SetAcceleratorTable(wxAcceleratorTable(static_cast<int>(std::size(keys)), keys));
+  return BuildButtonRow(*this, panel, rows);
+}
+
+void InfoFrame::Finished() {
+  timer_.Stop();
+  std::vector<FileUse> uses;
+  for (const FileInfo& file : files_) {
+    if (file.status == Status::Ok) uses.push_back({.path = file.path, .function = FileFunction::GetInfo});
+  }
+  frame_.NoteUses(uses);
+  if (list_ != nullptr) {
+    wxArrayString names;
+    names.Add(wxString::Format("All %zu files", files_.size()));
+    for (const FileInfo& file : files_) names.Add(Shown(platform::FileNameOf(file.path)));
+    list_->Set(names);
+    list_->SetSelection(0);
+  }
+  ShowChoice();
+  LogEvent("info", "files=" + std::to_string(files_.size()));
+}
+
+void InfoFrame::ShowChoice() {
+  const int line = list_ == nullptr ? 1 : list_->GetSelection();
+  if (line == wxNOT_FOUND || files_.empty()) return;
+  const FileInfo* const file = line == 0 ? nullptr : &files_[static_cast<size_t>(line) - 1];
+  const std::string problem = file == nullptr ? std::string() : file->problem;
+  problem_->SetLabel(Shown(problem));
+  problem_->Show(!problem.empty());
+  problem_->GetParent()->Layout();
+  tree_->Show(file == nullptr ? summary_ : file->sections);
+}
+
+std::string InfoFrame::WholeText() const {
+  const int line = list_ == nullptr ? 1 : list_->GetSelection();
+  if (timer_.IsRunning() || files_.empty() || line == wxNOT_FOUND) return {};  // files are still being read apart
+  if (line > 0) return TextOf(files_[static_cast<size_t>(line) - 1]);
+  std::string text = TextOf(summary_);
+  for (const FileInfo& file : files_) text.append("\n").append(TextOf(file));
+  return text;
+}
+
+}  // namespace fotomill::desktop

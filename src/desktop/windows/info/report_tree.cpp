@@ -1,0 +1,35 @@
+#include "desktop/windows/info/report_tree.h"
+
+#include "desktop/windows/widgets/looks.h"
+#include "desktop/windows/widgets/wx_text.h"
+
+namespace fotomill::desktop {
+
+ReportTree::ReportTree(wxWindow* parent) : wxTreeListCtrl(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTL_SINGLE) {
+  SetName("Facts");
+  AppendColumn("Name", TextWidth(*this, 260), wxALIGN_LEFT, wxCOL_RESIZABLE);
+  AppendColumn("Value", TextWidth(*this, 360), wxALIGN_LEFT, wxCOL_RESIZABLE);
+}
+
+void ReportTree::Show(std::span<const InfoSection> sections) {
+  DeleteAllItems();
+  for (const InfoSection& section : sections) {
+    const wxTreeListItem head = AppendItem(GetRootItem(), Shown(section.title));
+    for (const InfoLine& line : section.lines) {
+      const wxTreeListItem item = AppendItem(head, Shown(line.label.empty() ? line.value : line.label));
+      if (!line.label.empty()) SetItemText(item, 1, Shown(line.value));
+    }
+    Expand(head);
+  }
+  const wxTreeListItem first = GetFirstItem();
+  if (first.IsOk()) Select(first);
+}
+
+wxString ReportTree::SelectedValue() const {
+  const wxTreeListItem item = GetSelection();
+  if (!item.IsOk()) return {};
+  const wxString value = GetItemText(item, 1);
+  return value.empty() ? GetItemText(item, 0) : value;
+}
+
+}  // namespace fotomill::desktop
