@@ -1,9 +1,9 @@
 #include "batch/reported_run.h"
 
-#include <new>
 #include <utility>
 
 #include "batch/abort.h"
+#include "core/workers/folder_scope.h"
 #include "platform/clock.h"
 #include "platform/folders.h"
 #include "platform/process.h"
@@ -16,25 +16,22 @@ ReportedRun::ReportedRun(std::span<const BatchFile> files, BatchJob& job, Way wa
       job_(job),
       way_(std::move(way)),
       outcomes_(files.size()),
-      run_({.work = [this](size_t file) { Work(file); },
-            .deliver = [this](size_t file) { Deliver(file); },
+      run_({.work = [this](size_t file) { return Work(file); },
+            .deliver = [this](size_t file, Status status) { Deliver(file, status); },
             .goesOn = [this] { return !ended_ && !AbortAsked(); },
             .tick = [this] { Tick(); }}) {}
 
 uint32_t ReportedRun::CoreJobs() { return platform::CoreCount(); }
 
-void ReportedRun::Work(size_t file) {
-  std::optional<FileOutcome> outcome;
-  try {
-    outcome = way_.process(file);
-  } catch (const std::bad_alloc&) {
-    outcome = FileOutcome{.source = files_[file].name, .status = Status::MemoryAllocationError};
-  }
-  if (outcome) outcomes_[file] = std::make_unique<FileOutcome>(std::move(*outcome));
+Status ReportedRun::Work(size_t file) {
+  const FolderScope folder(files_[file].name);
+  if (auto outcome = way_.process(file)) outcomes_[file] = std::make_unique<FileOutcome>(std::move(*outcome));
+  return Status::Ok;
 }
 
-void ReportedRun::Deliver(size_t file) {
-  const std::unique_ptr<FileOutcome> outcome = std::move(outcomes_[file]);
+void ReportedRun::Deliver(size_t file, Status status) {
+  std::unique_ptr<FileOutcome> outcome = std::move(outcomes_[file]);
+  if (status != Status::Ok) outcome = std::make_unique<FileOutcome>(FileOutcome{.source = files_[file].name, .status = status});
   if (outcome == nullptr) return;
   job_.source.AssignCut(outcome->source);
   const bool written = !outcome->destination.empty() && !outcome->skipped && !way_.dryRun;

@@ -10,7 +10,7 @@
 #include <vector>
 
 #include "batch/job.h"
-#include "batch/ordered_run.h"
+#include "core/workers/ordered_run.h"
 #include "batch/run.h"
 
 namespace fotomill {
@@ -35,8 +35,8 @@ class ReportedRun {
 
  private:
   static uint32_t CoreJobs();
-  void Work(size_t file);
-  void Deliver(size_t file);
+  Status Work(size_t file);
+  void Deliver(size_t file, Status status);
   void Tick();
   void NoteUse(const std::string& source);
 

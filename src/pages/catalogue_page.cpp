@@ -3,15 +3,15 @@
 #include <algorithm>
 #include <atomic>
 #include <memory>
-#include <new>
 #include <utility>
 #include <vector>
 
 #include "batch/abort.h"
 #include "batch/destination_name.h"
-#include "batch/ordered_run.h"
 #include "batch/picture_failure.h"
 #include "core/text.h"
+#include "core/workers/folder_scope.h"
+#include "core/workers/ordered_run.h"
 #include "metadata/exif/picture_exif.h"
 #include "platform/clock.h"
 #include "platform/files.h"
@@ -63,8 +63,8 @@ class ContactSheet {
     const uint64_t cellBytes =
         uint64_t{3} * static_cast<uint32_t>(options_.look.cellWidth) * static_cast<uint32_t>(options_.look.cellHeight);
     const uint64_t room = kBytesAhead / std::max<uint64_t>(cellBytes, 1);
-    OrderedRun run({.work = [this](size_t i) { Work(i); },
-                    .deliver = [this](size_t i) { Deliver(i); },
+    OrderedRun run({.work = [this](size_t i) { return Work(i); },
+                    .deliver = [this](size_t i, Status status) { Deliver(i, status); },
                     .goesOn = [this] { return !ended_ && !AbortAsked(); },
                     .tick = [this] { Tick(); },
                     .ahead = std::max<size_t>(std::min<uint64_t>(room, kCellsAhead), size_t{jobs} + 1)});
@@ -80,15 +80,13 @@ class ContactSheet {
     PackedImage image;
   };
 
-  void Work(size_t i) {
-    auto cell = std::make_unique<Cell>();
-    cell->outcome = {.source = files_[i].name, .status = files_[i].status, .hint = files_[i].hint};
-    try {
-      if (cell->outcome.status == Status::Ok) Draw(cell->outcome, cell->image);
-    } catch (const std::bad_alloc&) {
-      cell->outcome.status = Status::MemoryAllocationError;
-    }
-    cells_[i] = std::move(cell);
+  Status Work(size_t i) {
+    const FolderScope folder(files_[i].name);
+    cells_[i] = std::make_unique<Cell>();
+    Cell& cell = *cells_[i];
+    cell.outcome = {.source = files_[i].name, .status = files_[i].status, .hint = files_[i].hint};
+    if (cell.outcome.status == Status::Ok) Draw(cell.outcome, cell.image);
+    return Status::Ok;
   }
 
   void Draw(FileOutcome& outcome, PackedImage& image) const {
@@ -105,8 +103,12 @@ class ContactSheet {
     return MakeCellImage(picture, options_.look, image);
   }
 
-  void Deliver(size_t i) {
-    const std::unique_ptr<Cell> cell = std::move(cells_[i]);
+  void Deliver(size_t i, Status status) {
+    std::unique_ptr<Cell> cell = std::move(cells_[i]);
+    if (status != Status::Ok) {
+      cell = std::make_unique<Cell>();
+      cell->outcome = {.source = files_[i].name, .status = status};
+    }
     job_.source.AssignCut(cell->outcome.source);
     if (cell->outcome.status == Status::Ok) cell->outcome.status = PutCell(*cell);
     waiting_.push_back(std::move(cell->outcome));

@@ -5,7 +5,6 @@
 #include <string>
 #include <vector>
 
-#include "batch/ordered_run.h"
 #include "batch/picture_failure.h"
 #include "catalog/thumbnails/thumbnail_database.h"
 #include "catalog/thumbnails/thumbnail_file.h"
@@ -13,6 +12,8 @@
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
 #include "cli/frame/used_files.h"
+#include "core/workers/folder_scope.h"
+#include "core/workers/ordered_run.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/process.h"
@@ -111,9 +112,15 @@ int AddFiles(const std::vector<SelectedFile>& files, uint32_t jobs, ThumbnailDat
   std::vector<Adding> addings(files.size());
   std::atomic<bool> goesOn = true;
   OrderedRun run({
-      .work = [&](size_t item) { addings[item] = MakeRecord(files[item]); },
-      .deliver =
+      .work =
           [&](size_t item) {
+            const FolderScope folder(files[item].name);
+            addings[item] = MakeRecord(files[item]);
+            return Status::Ok;
+          },
+      .deliver =
+          [&](size_t item, Status status) {
+            if (status != Status::Ok) addings[item].status = status;
             appending.Add(files[item], addings[item]);
             addings[item].record.reset();
             output.ShowProgress(item + 1, files.size());

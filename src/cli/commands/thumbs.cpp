@@ -8,13 +8,15 @@
 #include <string>
 #include <vector>
 
-#include "batch/ordered_run.h"
 #include "batch/picture_failure.h"
 #include "catalog/thumbnails/thumbnail_file.h"
 #include "cli/frame/file_selection.h"
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
 #include "cli/frame/used_files.h"
+#include "core/workers/folder_scope.h"
+#include "core/workers/guarded.h"
+#include "core/workers/ordered_run.h"
 #include "metadata/exif/picture_exif.h"
 #include "platform/files.h"
 #include "platform/paths.h"
@@ -119,11 +121,15 @@ int RunMake(const ThumbsOptions& options, const CommandContext& context) {
   OrderedRun run({
       .work =
           [&](size_t item) {
-            if (options.dryRun) return;
-            for (const size_t i : makings[item].together) makings[i].status = MakeThumbnail((*files)[i].name);
+            if (options.dryRun) return Status::Ok;
+            const FolderScope folder((*files)[item].name);
+            for (const size_t i : makings[item].together) {
+              makings[i].status = Guarded([&] { return MakeThumbnail((*files)[i].name); });
+            }
+            return Status::Ok;
           },
       .deliver =
-          [&](size_t item) {
+          [&](size_t item, Status) {
             ReportMaking((*files)[item], makings[item], output, used);
             output.ShowProgress(item + 1, files->size());
             goesOn = output.GoesOn();

@@ -9,14 +9,13 @@
 #include <cstring>
 #include <memory>
 #include <mutex>
-#include <system_error>
-#include <thread>
 #include <vector>
 
 #include "core/limits.h"
+#include "core/workers/guarded.h"
+#include "core/workers/worker_pool.h"
 #include "formats/png/png_filter.h"
 #include "platform/memory.h"
-#include "platform/process.h"
 
 namespace fotomill {
 
@@ -133,25 +132,17 @@ class BandMaker {
   int32_t bandRows_ = 1;
 };
 
-// Bands made ahead by other threads, handed out in order.
+// Bands made ahead by threads that have nothing else to do, handed out in order.
 class BandQueue {
  public:
-  BandQueue(const BandMaker& maker, unsigned threads) : maker_(maker), slots_(2 * threads) {
-    for (unsigned i = 1; i < threads; ++i) {
-      try {
-        workers_.emplace_back([this] { Work(); });
-      } catch (const std::system_error&) {
-        break;  // fewer do it as well
-      }
-    }
-  }
+  BandQueue(const BandMaker& maker, unsigned threads)
+      : maker_(maker), slots_(2 * threads), helpers_(WorkerPool::Shared(), threads - 1, [this] { return Help(); }) {}
   ~BandQueue() {
     {
       const std::lock_guard lock(mutex_);
       stopped_ = true;
     }
     changed_.notify_all();
-    for (std::thread& worker : workers_) worker.join();
   }
   BandQueue(const BandQueue&) = delete;
   BandQueue& operator=(const BandQueue&) = delete;
@@ -178,17 +169,20 @@ class BandQueue {
     const int32_t index = begun_++;
     band = Band();
     lock.unlock();
-    maker_.Make(index, band);
+    const Status status = Guarded([&] { maker_.Make(index, band); });
     lock.lock();
+    if (status != Status::Ok) band.status = status;
     band.done = true;
     changed_.notify_all();
     return true;
   }
-  void Work() {
+  bool Help() {
     std::unique_lock lock(mutex_);
     while (!stopped_ && begun_ < maker_.Bands()) {
-      if (!MakeNext(lock)) changed_.wait(lock);
+      if (MakeNext(lock)) return true;
+      changed_.wait(lock);
     }
+    return false;
   }
 
   const BandMaker& maker_;
@@ -197,7 +191,7 @@ class BandQueue {
   bool stopped_ = false;
   std::mutex mutex_;
   std::condition_variable changed_;
-  std::vector<std::thread> workers_;
+  Helpers helpers_;  // last: they use the rest
 };
 
 // One chunk, given in parts.
@@ -221,7 +215,7 @@ Status WritePngPixels(const PngRows& rows, bool filtered, int32_t level, ByteWri
   if (rows.rowBytes > limits.packedBlockBytes / 8) return Status::MemoryAllocationError;  // a band takes several rows' room
   const BandMaker maker(rows, filtered, level);
   const int32_t bands = maker.Bands();
-  BandQueue queue(maker, std::min({platform::CoreCount(), kMostThreads, static_cast<unsigned>(bands)}));
+  BandQueue queue(maker, std::min({WorkerPool::Shared().Cores(), kMostThreads, static_cast<unsigned>(bands)}));
   constexpr uint8_t kZlibHead[] = {0x78, 0xDA};  // deflate with a window of 32 KB, best compression
   uLong adler = 1;
   for (int32_t i = 0; i < bands; ++i) {

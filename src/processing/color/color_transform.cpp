@@ -6,12 +6,10 @@
 #include <cstdlib>
 #include <functional>
 #include <memory>
-#include <system_error>
-#include <thread>
 #include <vector>
 
 #include "core/byte_reader.h"
-#include "platform/process.h"
+#include "core/workers/share_out.h"
 
 // The library works on whole pixels in the order of a packed image. It is told to keep no last color in a transform, so
 // that threads can share one.
@@ -29,7 +27,7 @@ constexpr uint32_t kMostTags = 100;           // as many as the library reads
 constexpr uint64_t kHeaderSize = 128;         // of a profile; the tag table follows: count, then name, offset, size of each
 constexpr uint32_t kStepsType = 0x6d706574;   // "mpet"
 constexpr uint8_t kHiddenTag = 'x';           // begins no name of a tag
-constexpr uint64_t kPixelsPerCore = 1 << 18;  // fewer are not worth a thread
+constexpr uint64_t kPixelsPerBand = 1 << 18;  // fewer are not worth a thread
 constexpr int32_t kUnseen = 1;                // a difference of 8-bit values that rounding may make
 
 struct CloseProfile {
@@ -95,23 +93,14 @@ bool IsGray(const PackedImage& image) {
   return true;
 }
 
-// Divides rows among the cores, `work` gets a first one and the one behind the last. What no thread can be had for is done
-// here.
+// Divides rows among the cores that are free, `work` gets a first one and the one behind the last.
 void ForBandsOfRows(int32_t rows, uint64_t pixels, const std::function<void(int32_t, int32_t)>& work) {
-  const uint64_t most = std::min<uint64_t>(platform::CoreCount(), static_cast<uint64_t>(rows));
-  const int32_t bands = static_cast<int32_t>(std::clamp<uint64_t>(pixels / kPixelsPerCore, 1, most));
+  const auto bands = static_cast<int32_t>(std::clamp<uint64_t>(pixels / kPixelsPerBand, 1, static_cast<uint64_t>(rows)));
   const auto start = [&](int32_t band) { return static_cast<int32_t>(int64_t{rows} * band / bands); };
-  std::vector<std::thread> threads;
-  int32_t own = bands - 1;  // the bands from here on
-  for (int32_t band = 0; band < own; ++band) {
-    try {
-      threads.emplace_back(work, start(band), start(band + 1));
-    } catch (const std::system_error&) {
-      own = band;
-    }
-  }
-  work(start(own), rows);
-  for (std::thread& thread : threads) thread.join();
+  (void)ShareOut(bands, [&](int32_t band) {
+    work(start(band), start(band + 1));
+    return Status::Ok;
+  });
 }
 
 }  // namespace

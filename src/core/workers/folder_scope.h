@@ -1,0 +1,20 @@
+#pragma once
+
+#include <optional>
+#include <string>
+
+#include "core/workers/worker_pool.h"
+
+namespace fotomill {
+
+// For its lifetime, a task works with a file: where that lies on a network folder or a disc, which may hang for minutes, the task
+// keeps no core of the pool busy. Asking where it lies may hang as well, and keeps none busy either.
+class FolderScope {
+ public:
+  explicit FolderScope(const std::string& path);
+
+ private:
+  std::optional<CoreRelease> release_;
+};
+
+}  // namespace fotomill

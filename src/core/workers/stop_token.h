@@ -1,0 +1,35 @@
+#pragma once
+
+#include <atomic>
+#include <memory>
+
+#include "platform/process.h"
+
+namespace fotomill {
+
+// Asked by work now and then: whether its result is still wanted. Copies ask the same source, and may outlive it.
+class StopToken {
+ public:
+  StopToken() = default;  // of no source: only the end of the program stops its work
+  // Whether the source was stopped, or the program was asked to end (Ctrl-C, the system's request).
+  bool Asked() const {
+    return (stopped_ != nullptr && stopped_->load(std::memory_order_relaxed)) || platform::PendingExit() != 0;
+  }
+
+ private:
+  friend class StopSource;
+  explicit StopToken(std::shared_ptr<const std::atomic<bool>> stopped) : stopped_(std::move(stopped)) {}
+  std::shared_ptr<const std::atomic<bool>> stopped_;
+};
+
+// Stops the work of those who hold its tokens; once stopped, it stays so. Copies are the same source.
+class StopSource {
+ public:
+  void Stop() const { stopped_->store(true, std::memory_order_relaxed); }
+  StopToken Token() const { return StopToken(stopped_); }
+
+ private:
+  std::shared_ptr<std::atomic<bool>> stopped_ = std::make_shared<std::atomic<bool>>(false);
+};
+
+}  // namespace fotomill

@@ -1,0 +1,195 @@
+#include "core/workers/worker_pool.h"
+
+#include <algorithm>
+#include <memory>
+#include <utility>
+
+#include "core/workers/guarded.h"
+#include "platform/process.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr size_t kMostThreads = 256;   // more only cost
+constexpr size_t kMostBlocking = 128;  // of these; so many hanging folders leave room for others
+constexpr Lane kLanes[] = {Lane::Urgent, Lane::Blocking, Lane::Compute};  // in the order in which they are looked at
+
+// The pool one of whose cores this thread keeps busy.
+thread_local WorkerPool* coreOf = nullptr;
+
+}  // namespace
+
+WorkerPool::WorkerPool(unsigned cores, std::function<void()> quiet) : cores_(std::max(cores, 1u)), quiet_(std::move(quiet)) {}
+
+WorkerPool::~WorkerPool() {
+  {
+    const std::lock_guard lock(mutex_);
+    ending_ = true;
+  }
+  wake_.notify_all();
+  // A thread that ends its last task may still begin another one.
+  for (size_t i = 0;; ++i) {
+    std::thread thread;
+    {
+      const std::lock_guard lock(mutex_);
+      if (i == threads_.size()) return;
+      thread = std::move(threads_[i]);
+    }
+    thread.join();
+  }
+}
+
+WorkerPool& WorkerPool::Shared() {
+  static WorkerPool* const pool = std::make_unique<WorkerPool>(platform::CoreCount()).release();
+  return *pool;
+}
+
+bool WorkerPool::MayBegin(Lane lane) const {
+  if (waiting_[static_cast<size_t>(lane)].empty()) return false;
+  if (lane == Lane::Compute) return HasRoom();
+  return lane == Lane::Urgent || blocking_ < kMostBlocking;
+}
+
+bool WorkerPool::Run(Lane lane, std::function<void()> task) {
+  const std::lock_guard lock(mutex_);
+  std::deque<std::function<void()>>& waiting = waiting_[static_cast<size_t>(lane)];
+  if (Guarded([&] { waiting.push_back(std::move(task)); }) != Status::Ok) return false;
+  if (MayBegin(lane)) WakeOne();
+  if (!threads_.empty()) return true;
+  waiting.pop_back();
+  return false;
+}
+
+// Sees to it that one more thread looks for work. Locked.
+void WorkerPool::WakeOne() {
+  if (idle_ > wakings_) {
+    ++wakings_;
+    wake_.notify_one();
+  } else if (threads_.size() < kMostThreads) {
+    // Where the system has no further thread, those that there are do the work.
+    (void)Guarded([this] { threads_.emplace_back([this] { Work(); }); });
+  }
+}
+
+// The same when a core has become free. Locked.
+void WorkerPool::WakeForCore() {
+  if (HasRoom() && (MayBegin(Lane::Compute) || FindSpare() != spare_.end())) WakeOne();
+}
+
+std::list<WorkerPool::SpareWork*>::iterator WorkerPool::FindSpare() {
+  return std::ranges::find_if(spare_, [](const SpareWork* work) { return !work->exhausted && work->running < work->most; });
+}
+
+bool WorkerPool::TakeTask(Task& task) {
+  for (const Lane lane : kLanes) {
+    if (!MayBegin(lane)) continue;
+    std::deque<std::function<void()>>& waiting = waiting_[static_cast<size_t>(lane)];
+    task = {std::move(waiting.front()), lane != Lane::Blocking};
+    waiting.pop_front();
+    ++running_;
+    if (task.counts) {
+      ++busy_;
+    } else {
+      ++blocking_;
+      WakeForCore();  // this thread may have come for a core
+    }
+    return true;
+  }
+  return false;
+}
+
+// One step of spare work, if there is any and a core for it.
+bool WorkerPool::HelpOut(std::unique_lock<std::mutex>& lock) {
+  const auto found = HasRoom() ? FindSpare() : spare_.end();
+  if (found == spare_.end()) return false;
+  SpareWork& work = **found;
+  ++work.running;
+  ++busy_;
+  WakeForCore();
+  lock.unlock();
+  coreOf = this;
+  bool more = false;
+  (void)Guarded([&] { more = work.step(); });
+  coreOf = nullptr;
+  lock.lock();
+  --busy_;
+  --work.running;
+  work.exhausted = work.exhausted || !more;
+  helped_.notify_all();
+  return true;
+}
+
+void WorkerPool::Work() {
+  std::unique_lock lock(mutex_);
+  for (;;) {
+    if (Task task; TakeTask(task)) {
+      lock.unlock();
+      coreOf = task.counts ? this : nullptr;
+      (void)Guarded(task.run);
+      task.run = nullptr;  // what it holds goes before the task counts as done
+      coreOf = nullptr;
+      lock.lock();
+      --running_;
+      if (task.counts) {
+        --busy_;
+      } else {
+        --blocking_;
+      }
+      const bool quiet = running_ == 0 && std::ranges::all_of(waiting_, [](const auto& lane) { return lane.empty(); });
+      if (!quiet || !quiet_) continue;
+      lock.unlock();
+      (void)Guarded(quiet_);
+      lock.lock();
+    } else if (!HelpOut(lock)) {
+      if (ending_) return;
+      ++idle_;
+      wake_.wait(lock, [this] { return wakings_ > 0 || ending_; });
+      --idle_;
+      if (wakings_ > 0) --wakings_;
+    }
+  }
+}
+
+// Locked, both.
+void WorkerPool::GiveCore() {
+  --busy_;
+  WakeForCore();
+}
+
+void WorkerPool::TakeCore() { ++busy_; }
+
+bool CoreRelease::HoldsCore() { return coreOf != nullptr; }
+
+CoreRelease::CoreRelease() : pool_(std::exchange(coreOf, nullptr)) {
+  if (pool_ == nullptr) return;
+  const std::lock_guard lock(pool_->mutex_);
+  pool_->GiveCore();
+}
+
+CoreRelease::~CoreRelease() {
+  if (pool_ == nullptr) return;
+  coreOf = pool_;
+  const std::lock_guard lock(pool_->mutex_);
+  pool_->TakeCore();
+}
+
+Helpers::Helpers(WorkerPool& pool, unsigned most, std::function<bool()> step) : pool_(pool) {
+  work_.step = std::move(step);
+  work_.most = most;
+  ownCore_ = coreOf != &pool;
+  const std::lock_guard lock(pool_.mutex_);
+  if (ownCore_) pool_.TakeCore();
+  if (most == 0) return;
+  pool_.spare_.push_back(&work_);
+  pool_.WakeForCore();  // the one that comes wakes the next
+}
+
+Helpers::~Helpers() {
+  std::unique_lock lock(pool_.mutex_);
+  std::erase(pool_.spare_, &work_);
+  pool_.helped_.wait(lock, [this] { return work_.running == 0; });
+  if (ownCore_) pool_.GiveCore();
+}
+
+}  // namespace fotomill
