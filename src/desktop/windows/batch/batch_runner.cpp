@@ -14,7 +14,9 @@
 #include "desktop/windows/batch/progress_window.h"
 #include "desktop/windows/batch/prompt_for_destination.h"
 #include "desktop/windows/files/file_actions.h"
-#include "desktop/windows/shell/main_frame.h"
+#include "desktop/windows/history/use_recorder.h"
+#include "desktop/windows/shell/browser_tabs.h"
+#include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
@@ -23,7 +25,7 @@
 
 namespace fotomill::desktop {
 
-BatchRunner::BatchRunner(MainFrame& frame) : frame_(frame) {
+BatchRunner::BatchRunner(Shell& shell) : shell_(shell) {
   thread_ = std::make_unique<BatchThread>(
       *this, [this](std::function<void()> action) { CallAfter([action = std::move(action)] { action(); }); });
 }
@@ -41,7 +43,7 @@ void BatchRunner::Run(BatchJob job, BatchThread::Work work, std::shared_ptr<Prev
   if (!Running()) {
     StartNext();
   } else {
-    frame_.Tell("The batch begins when the one before has ended.");
+    shell_.Report("The batch begins when the one before has ended.");
     TellWaiting();
   }
 }
@@ -72,7 +74,7 @@ void BatchRunner::CloseBox() {
   if (box_ != nullptr) std::exchange(box_, nullptr)->Destroy();
 }
 
-wxWindow* BatchRunner::DialogParent() const { return box_ != nullptr ? static_cast<wxWindow*>(box_) : &frame_; }
+wxWindow* BatchRunner::DialogParent() const { return box_ != nullptr ? static_cast<wxWindow*>(box_) : &shell_.Window(); }
 
 // --- the progress box ---
 
@@ -83,9 +85,9 @@ void BatchRunner::BatchOpened() {
     if (box_ == &box) box_ = nullptr;
     box.Destroy();
   };
-  events.selectFailed = [this](const std::vector<std::string>& files) { frame_.SelectFiles(files); };
+  events.selectFailed = [this](const std::vector<std::string>& files) { shell_.Tabs().SelectFiles(files); };
   LeaveBox();
-  box_ = new ProgressWindow(&frame_, frame_.Thumbnails(), events);
+  box_ = new ProgressWindow(&shell_.Window(), shell_.Thumbnails(), events);
   box_->Show();
   TellWaiting();
   LogEvent("batch", "opened");
@@ -122,14 +124,14 @@ void BatchRunner::BatchCloses() {
 
 void BatchRunner::BatchEnded(Status status, const BatchJob& job) {
   LogEvent("batch", "ended status=" + std::to_string(StatusNumber(status)));
-  frame_.NoteUses(job.uses);
+  shell_.Uses().Note(job.uses);
   // Outputs, not files that were given other names.
-  if (job.formatIndex != kNoFormat) frame_.Files().NoteDone(std::exchange(written_, {}));
-  if (previous_ != nullptr) frame_.Files().NoteDone(std::exchange(previous_, nullptr)->Deed());
-  if (job.filesChanged) frame_.FilesChanged();
+  if (job.formatIndex != kNoFormat) shell_.Files().NoteDone(std::exchange(written_, {}));
+  if (previous_ != nullptr) shell_.Files().NoteDone(std::exchange(previous_, nullptr)->Deed());
+  if (job.filesChanged) shell_.FilesChanged();
   if (!seen_)
-    NotifyUser(frame_, failed_ == 0 ? "Batch finished" : "Batch finished with errors", Shown(CountLine(job.progress.Files())));
-  if (status == Status::Ok) frame_.Tell(CountLine(job.progress.Files()));
+    NotifyUser(shell_.Window(), failed_ == 0 ? "Batch finished" : "Batch finished with errors", Shown(CountLine(job.progress.Files())));
+  if (status == Status::Ok) shell_.Report(CountLine(job.progress.Files()));
   CallAfter([this] { StartNext(); });
 }
 
@@ -177,22 +179,22 @@ void BatchRunner::StoreFlag(KeyNumber key, bool value) {
   if (StoreSetting(KeyOf(key), flag) != SaveResult::Done) StoreNumber(KeyOf(key), flag.number);
 }
 
-void TurnSelection(MainFrame& frame, Orientation turn) {
+void TurnSelection(Shell& shell, Orientation turn) {
   std::vector<BatchFile> files;
-  for (const std::string& file : frame.SelectedFiles()) files.push_back({.name = file, .below = {}, .hint = {}});
+  for (const std::string& file : shell.Tabs().SelectedFiles()) files.push_back({.name = file, .below = {}, .hint = {}});
   if (files.empty()) return;
   auto previous = std::make_shared<PreviousFiles>();
   TurnFunction function{.request = {.turn = turn, .seenByExif = settings.ExifAdjustOrientation != 0}, .inPlace = true};
   function.keepPrevious = [previous](const std::string& path) { return previous->Keep(path); };
   function.replaced = [previous](const std::string& path) { previous->Replaced(path); };
-  frame.Batches().Run(
+  shell.Batches().Run(
       BatchJob(), [files, function](BatchJob& job) { return RunTurn(files, function, job); }, previous);
 }
 
-void ConvertSelection(MainFrame& frame) {
-  const std::vector<std::string> files = frame.SelectedFiles();
+void ConvertSelection(Shell& shell) {
+  const std::vector<std::string> files = shell.Tabs().SelectedFiles();
   if (files.empty()) return;
-  DestinationDialog dialog(&frame, "Convert", files);
+  DestinationDialog dialog(&shell.Window(), "Convert", files);
   LogEvent("prompt", "destination");
   if (dialog.ShowModal() != wxID_OK) return;
   const DestinationChoice choice = dialog.Choice();
@@ -202,7 +204,7 @@ void ConvertSelection(MainFrame& frame) {
   function.reduce = choice.reduce;
   function.autoOrient = choice.autoOrient;
   function.keepMetadata = choice.keepMetadata;
-  frame.Batches().Run(std::move(batch), std::move(function), JobFor(choice));
+  shell.Batches().Run(std::move(batch), std::move(function), JobFor(choice));
 }
 
 }  // namespace fotomill::desktop

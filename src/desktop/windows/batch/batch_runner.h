@@ -13,14 +13,14 @@
 
 namespace fotomill::desktop {
 
-class MainFrame;
+class Shell;
 class PreviousFiles;
 class ProgressWindow;
 
 // Runs batches for a frame, one after the other, with their progress box and prompts.
 class BatchRunner : public wxEvtHandler, public BatchWindows {
  public:
-  explicit BatchRunner(MainFrame& frame);
+  explicit BatchRunner(Shell& shell);
   ~BatchRunner() override;
 
   // Begins a batch, or has it wait for those before.
@@ -55,7 +55,7 @@ class BatchRunner : public wxEvtHandler, public BatchWindows {
   void BatchEnded(Status status, const BatchJob& job) override;
   wxWindow* DialogParent() const;
 
-  MainFrame& frame_;
+  Shell& shell_;
   std::deque<Waiting> waiting_;
   ProgressWindow* box_ = nullptr;            // of the batch that runs or was the last
   bool seen_ = false;                        // its end, by the user
@@ -66,9 +66,9 @@ class BatchRunner : public wxEvtHandler, public BatchWindows {
 };
 
 // Turns the frame's selection in its files.
-void TurnSelection(MainFrame& frame, Orientation turn);
+void TurnSelection(Shell& shell, Orientation turn);
 
 // The function Convert: asks for the destination and runs the batch over the frame's selection.
-void ConvertSelection(MainFrame& frame);
+void ConvertSelection(Shell& shell);
 
 }  // namespace fotomill::desktop

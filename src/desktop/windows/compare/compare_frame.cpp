@@ -12,8 +12,10 @@
 #include "catalog/history/file_history.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/files/file_actions.h"
+#include "desktop/windows/history/use_recorder.h"
 #include "desktop/windows/info/info_frame.h"
-#include "desktop/windows/shell/main_frame.h"
+#include "desktop/windows/shell/browser_tabs.h"
+#include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/key_commands.h"
 #include "desktop/windows/widgets/screen_reader.h"
 #include "desktop/windows/widgets/wx_text.h"
@@ -79,11 +81,11 @@ std::span<const KeyCommand<CompareFrame>> Commands() { return kCommands; }
 
 }  // namespace
 
-CompareFrame::CompareFrame(MainFrame& frame, const std::vector<std::string>& files)
-    : wxFrame(&frame, wxID_ANY, "Compare", wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE,
+CompareFrame::CompareFrame(Shell& shell, const std::vector<std::string>& files)
+    : wxFrame(&shell.Window(), wxID_ANY, "Compare", wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE,
               "FotomillProfessionalCompare"),
-      frame_(frame) {
-  SetSize(frame.GetSize());
+      shell_(shell) {
+  SetSize(shell.Window().GetSize());
   for (const std::string& file : files) panes_.push_back(BuildPane(file));
   place_ = panes_.front().canvas->Place();
   loader_ = std::make_unique<ViewLoader>(kNoLimit, [this] { CallAfter([this] { PicturesCame(); }); });
@@ -171,7 +173,7 @@ void CompareFrame::FilesChanged() {
 void CompareFrame::TakePicture(Pane& pane, ViewPicturePointer picture) {
   LogEvent("compare", "pane=" + std::to_string(PaneOf(pane.canvas) + 1) + "/" + std::to_string(panes_.size()) +
                           " status=" + std::to_string(StatusNumber(picture->status)) + " file=" + pane.path);
-  if (picture->picture != nullptr) frame_.NoteUses({FileUse{pane.path, FileFunction::View}});
+  if (picture->picture != nullptr) shell_.Uses().Note({FileUse{pane.path, FileFunction::View}});
   pane.canvas->Show(std::move(picture));
   if (joined_) pane.canvas->SetPlace(place_);
 }
@@ -242,12 +244,12 @@ void CompareFrame::SettingSwitched() {
 void CompareFrame::ShowInfoWindow() {
   std::vector<std::string> paths;
   for (const Pane& pane : panes_) paths.push_back(pane.path);
-  (new InfoFrame(frame_, this, std::move(paths)))->Show();
+  (new InfoFrame(shell_, this, std::move(paths)))->Show();
 }
 
 void CompareFrame::DeleteFile() {
   const Pane gone = panes_[focus_];
-  if (!frame_.Files().TrashFromView(this, gone.path)) return;
+  if (!shell_.Files().TrashFromView(this, gone.path)) return;
   loader_->Forget(gone.path);
   panes_.erase(panes_.begin() + static_cast<std::ptrdiff_t>(focus_));
   gone.panel->Hide();
@@ -278,10 +280,10 @@ void CompareFrame::OnKey(wxKeyEvent& event) {
   event.Skip();
 }
 
-void CompareSelection(MainFrame& frame) {
-  std::vector<std::string> files = frame.SelectedFiles();
-  if (!CompareFrame::Takes(files.size())) return frame.Tell("Two to four files can be compared.");
-  (new CompareFrame(frame, files))->Show();
+void CompareSelection(Shell& shell) {
+  std::vector<std::string> files = shell.Tabs().SelectedFiles();
+  if (!CompareFrame::Takes(files.size())) return shell.Report("Two to four files can be compared.");
+  (new CompareFrame(shell, files))->Show();
 }
 
 }  // namespace fotomill::desktop

@@ -13,14 +13,14 @@ class wxStaticText;
 
 namespace fotomill::desktop {
 
-class MainFrame;
+class Shell;
 
 // Two to four pictures beside each other, zoomed and moved together in parts of each. Commands go to the pane with the focus.
 class CompareFrame : public wxFrame {
  public:
   static constexpr bool Takes(size_t files) { return files >= 2 && files <= 4; }
 
-  CompareFrame(MainFrame& frame, const std::vector<std::string>& files);
+  CompareFrame(Shell& shell, const std::vector<std::string>& files);
   ~CompareFrame() override;
 
   // Files were written: panes whose files are others now load them again.
@@ -56,7 +56,7 @@ class CompareFrame : public wxFrame {
   ViewWish WishOf(const Pane& pane) const;
   void OnKey(wxKeyEvent& event);
 
-  MainFrame& frame_;
+  Shell& shell_;
   std::vector<Pane> panes_;
   size_t focus_ = 0;
   bool joined_ = true;
@@ -65,6 +65,6 @@ class CompareFrame : public wxFrame {
 };
 
 // Functions > Compare: the selected files.
-void CompareSelection(MainFrame& frame);
+void CompareSelection(Shell& shell);
 
 }  // namespace fotomill::desktop

@@ -11,7 +11,7 @@
 
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/shell/commands.h"
-#include "desktop/windows/shell/main_frame.h"
+#include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/wx_text.h"
 
 namespace fotomill::desktop {
@@ -93,11 +93,11 @@ class FinderBox : public wxDialog {
 
 }  // namespace
 
-void FindCommand(MainFrame& frame) {
-  FinderBox box(&frame);
+void FindCommand(Shell& shell) {
+  FinderBox box(&shell.Window());
   if (box.ShowModal() != wxID_OK || box.Chosen() == wxID_NONE) return;
   // Once the box has gone, so that the command finds the frame as it was.
-  frame.CallAfter([&frame, id = box.Chosen()] { frame.ProcessCommand(id); });
+  shell.Window().CallAfter([&shell, id = box.Chosen()] { shell.Window().ProcessCommand(id); });
 }
 
 }  // namespace fotomill::desktop

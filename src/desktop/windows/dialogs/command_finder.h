@@ -2,9 +2,9 @@
 
 namespace fotomill::desktop {
 
-class MainFrame;
+class Shell;
 
 // Lets the user find a command by words of its name, and runs it.
-void FindCommand(MainFrame& frame);
+void FindCommand(Shell& shell);
 
 }  // namespace fotomill::desktop

@@ -15,7 +15,9 @@
 #include "desktop/models/files/previous_file.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/dialogs/folder_dialog.h"
-#include "desktop/windows/shell/main_frame.h"
+#include "desktop/windows/history/use_recorder.h"
+#include "desktop/windows/shell/browser_tabs.h"
+#include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/files.h"
 #include "platform/paths.h"
@@ -44,8 +46,7 @@ std::string Count(size_t files) { return files == 1 ? std::string("1 file") : st
 
 }  // namespace
 
-FileActions::FileActions(MainFrame& frame)
-    : frame_(frame), undo_(static_cast<size_t>(std::clamp(settings.UndoLevels, 1, 1000))) {}
+FileActions::FileActions(Shell& shell) : shell_(shell), undo_(static_cast<size_t>(std::clamp(settings.UndoLevels, 1, 1000))) {}
 
 FileActions::~FileActions() {
   stop_ = true;
@@ -53,14 +54,14 @@ FileActions::~FileActions() {
 }
 
 void FileActions::Run(const std::string& what, Work work, Then then) {
-  if (busy_) return frame_.Tell("Wait until the files before are done.");
+  if (busy_) return shell_.Report("Wait until the files before are done.");
   if (thread_.joinable()) thread_.join();
   busy_ = true;
   stop_ = false;
   thread_ = std::thread([this, what, work = std::move(work), then = std::move(then)] {
     DeedResult result = work([this, &what](size_t index, size_t count) {
       CallAfter([this, what, index, count] {
-        if (count > 1) frame_.Tell(what + ": " + std::to_string(index + 1) + " of " + std::to_string(count));
+        if (count > 1) shell_.Report(what + ": " + std::to_string(index + 1) + " of " + std::to_string(count));
       });
       return !stop_;
     });
@@ -71,12 +72,12 @@ void FileActions::Run(const std::string& what, Work work, Then then) {
 void FileActions::Finished(const std::string& what, DeedResult result, const Then& then) {
   busy_ = false;
   const std::string failed = result.failures.empty() ? "" : ", " + std::to_string(result.failures.size()) + " failed";
-  frame_.Tell(what + failed + (result.note.empty() ? "" : ": " + result.note));
+  shell_.Report(what + failed + (result.note.empty() ? "" : ": " + result.note));
   LogEvent("files",
            what + " done=" + std::to_string(result.done.steps.size()) + " failed=" + std::to_string(result.failures.size()));
   const std::vector<DeedFailure> failures = result.failures;
   then(std::move(result));
-  frame_.FilesChanged();
+  shell_.FilesChanged();
   TellFailures(failures);
 }
 
@@ -87,7 +88,7 @@ void FileActions::TellFailures(const std::vector<DeedFailure>& failures) {
     text += Shown(platform::FileNameOf(failures[i].path)) + ": " + Shown(failures[i].reason) + "\n";
   }
   if (failures.size() > kMostFailuresShown) text += wxString::Format("and %zu more", failures.size() - kMostFailuresShown);
-  wxMessageBox(text, "Not everything could be done", wxOK | wxICON_WARNING, &frame_);
+  wxMessageBox(text, "Not everything could be done", wxOK | wxICON_WARNING, &shell_.Window());
 }
 
 void FileActions::Do(DeedKind kind, const std::vector<std::string>& paths, const std::string& folder) {
@@ -105,7 +106,7 @@ void FileActions::Do(DeedKind kind, const std::vector<std::string>& paths, const
 
 void FileActions::Follow(const FileDeed& deed, bool back) {
   if (deed.kind != DeedKind::Rename && deed.kind != DeedKind::Move) return;
-  for (const FileStep& step : deed.steps) frame_.FollowRename(back ? step.to : step.from, back ? step.from : step.to);
+  for (const FileStep& step : deed.steps) shell_.FollowRename(back ? step.to : step.from, back ? step.from : step.to);
 }
 
 bool FileActions::Trash(const std::vector<std::string>& paths) {
@@ -132,7 +133,7 @@ bool FileActions::Delete(const std::vector<std::string>& paths) {
   if (paths.empty()) return false;
   const wxString what = paths.size() == 1 ? "\"" + Shown(platform::FileNameOf(paths.front())) + "\"" : Shown(Count(paths.size()));
   const wxString why = platform::HasTrash(paths.front()) ? wxString() : wxString("There is no trash for files of this folder.\n");
-  wxMessageDialog dialog(&frame_, why + "Delete " + what + " for good? This cannot be undone.", "Delete",
+  wxMessageDialog dialog(&shell_.Window(), why + "Delete " + what + " for good? This cannot be undone.", "Delete",
                          wxOK | wxCANCEL | wxCANCEL_DEFAULT | wxICON_WARNING);
   dialog.SetOKLabel("&Delete");
   LogEvent("prompt", "delete");
@@ -145,10 +146,14 @@ bool FileActions::Delete(const std::vector<std::string>& paths) {
 void FileActions::CopyTo(const std::vector<std::string>& paths, const std::string& folder) { Do(DeedKind::Copy, paths, folder); }
 void FileActions::MoveTo(const std::vector<std::string>& paths, const std::string& folder) { Do(DeedKind::Move, paths, folder); }
 
+void FileActions::Drop(const std::vector<std::string>& paths, const std::string& folder, bool move) {
+  Do(move ? DeedKind::Move : DeedKind::Copy, paths, folder);
+}
+
 void FileActions::Rename(const std::string& path, const std::string& name) {
   if (!IsPlainName(name)) {
     wxMessageBox("A name cannot hold \"" + Shown(std::string(1, platform::kSeparator)) + "\".", "Rename", wxOK | wxICON_WARNING,
-                 &frame_);
+                 &shell_.Window());
     return;
   }
   RenameAll({{path, platform::JoinFolder(platform::SplitPath(path).folder, name)}});
@@ -164,27 +169,28 @@ void FileActions::RenameAll(std::vector<FileStep> steps) {
       [this, one, shown](DeedResult result) {
         const bool done = !result.done.steps.empty();
         for (const FileStep& step : result.done.steps) {
-          frame_.NoteUses({FileUse{step.from, FileFunction::MoveAndCopy, kOwnTime, kOwnTime, true}});
+          shell_.Uses().Note({FileUse{step.from, FileFunction::MoveAndCopy, kOwnTime, kOwnTime, true}});
         }
         Follow(result.done, false);
         undo_.Add(std::move(result.done));
-        if (BrowserPage* browser = frame_.Browser(); one && done && browser != nullptr)
+        if (BrowserPage* browser = shell_.Tabs().Front(); one && done && browser != nullptr)
           browser->Open(browser->Model().Folder(), shown);
       });
 }
 
 void FileActions::NewFolder(const std::string& parent) {
-  wxTextEntryDialog dialog(&frame_, "Name of the new folder:", "New folder", wxString::FromUTF8(settings.NewFolderName.c_str()));
+  wxTextEntryDialog dialog(&shell_.Window(), "Name of the new folder:", "New folder",
+                           wxString::FromUTF8(settings.NewFolderName.c_str()));
   if (dialog.ShowModal() != wxID_OK) return;
   const std::string name = Utf8(dialog.GetValue());
   const std::string path = platform::JoinFolder(parent, name);
   if (!IsPlainName(name) || name.empty() || platform::FileExists(path) || !platform::MakeFolders(path)) {
-    wxMessageBox("The folder could not be made.", "New folder", wxOK | wxICON_WARNING, &frame_);
+    wxMessageBox("The folder could not be made.", "New folder", wxOK | wxICON_WARNING, &shell_.Window());
     return;
   }
-  if (BrowserPage* browser = frame_.Browser(); browser != nullptr && browser->Model().Folder() == parent)
+  if (BrowserPage* browser = shell_.Tabs().Front(); browser != nullptr && browser->Model().Folder() == parent)
     browser->Open(parent, name);
-  frame_.FilesChanged();
+  shell_.FilesChanged();
 }
 
 bool FileActions::SaveTurned(const std::string& path, Orientation turn, Turned then) {
@@ -241,7 +247,7 @@ void FileActions::ToClipboard(const std::vector<std::string>& paths, bool cut) {
   both->Add(marked);
   const wxClipboardLocker clipboard;
   if (!clipboard || !wxTheClipboard->SetData(both)) return wxBell();
-  frame_.Tell(Count(paths.size()) + (cut ? " cut" : " copied") + ".");
+  shell_.Report(Count(paths.size()) + (cut ? " cut" : " copied") + ".");
 }
 
 void FileActions::PathsToClipboard(const std::vector<std::string>& paths) {
@@ -273,7 +279,7 @@ void FileActions::Paste(const std::string& folder) {
 void FileActions::PastePicture(const std::string& folder) {
   wxBitmapDataObject bitmap;
   if (!wxTheClipboard->GetData(bitmap) || !bitmap.GetBitmap().IsOk()) {
-    return frame_.Tell("There are no files and no picture on the clipboard.");
+    return shell_.Report("There are no files and no picture on the clipboard.");
   }
   Run(
       "Paste",
@@ -281,7 +287,7 @@ void FileActions::PastePicture(const std::string& folder) {
       [this](DeedResult result) {
         const std::vector<FileStep> made = result.done.steps;
         undo_.Add(std::move(result.done));
-        BrowserPage* const browser = frame_.Browser();
+        BrowserPage* const browser = shell_.Tabs().Front();
         if (browser != nullptr && !made.empty())
           browser->Open(browser->Model().Folder(), std::string(platform::FileNameOf(made[0].to)));
       });
@@ -289,22 +295,22 @@ void FileActions::PastePicture(const std::string& folder) {
 
 // --- functions of the menu ---
 
-void TrashSelection(MainFrame& frame) { frame.Files().Trash(frame.SelectedPaths()); }
-void DeleteSelection(MainFrame& frame) { frame.Files().Delete(frame.SelectedPaths()); }
+void TrashSelection(Shell& shell) { shell.Files().Trash(shell.Tabs().SelectedPaths()); }
+void DeleteSelection(Shell& shell) { shell.Files().Delete(shell.Tabs().SelectedPaths()); }
 
 namespace {
 
-void AskAndDo(MainFrame& frame, const wxString& verb,
+void AskAndDo(Shell& shell, const wxString& verb,
               void (FileActions::*action)(const std::vector<std::string>&, const std::string&)) {
-  const std::vector<std::string> paths = frame.SelectedPaths();
+  const std::vector<std::string> paths = shell.Tabs().SelectedPaths();
   if (paths.empty()) return;
-  const auto folder = AskForFolder(frame, verb + " " + Shown(Count(paths.size())) + " to", verb, HistoryList::MoveCopy);
-  if (folder) (frame.Files().*action)(paths, *folder);
+  const auto folder = AskForFolder(shell.Window(), verb + " " + Shown(Count(paths.size())) + " to", verb, HistoryList::MoveCopy);
+  if (folder) (shell.Files().*action)(paths, *folder);
 }
 
 }  // namespace
 
-void CopySelectionTo(MainFrame& frame) { AskAndDo(frame, "Copy", &FileActions::CopyTo); }
-void MoveSelectionTo(MainFrame& frame) { AskAndDo(frame, "Move", &FileActions::MoveTo); }
+void CopySelectionTo(Shell& shell) { AskAndDo(shell, "Copy", &FileActions::CopyTo); }
+void MoveSelectionTo(Shell& shell) { AskAndDo(shell, "Move", &FileActions::MoveTo); }
 
 }  // namespace fotomill::desktop

@@ -13,13 +13,13 @@
 
 namespace fotomill::desktop {
 
-class MainFrame;
+class Shell;
 
 // What the frame does to files: on a thread of its own, one thing after the other, told of in the status bar, and kept so
 // that it can be taken back.
 class FileActions : public wxEvtHandler {
  public:
-  explicit FileActions(MainFrame& frame);
+  explicit FileActions(Shell& shell);
   ~FileActions() override;
 
   // False when the user was asked and does not want it, where there is no trash.
@@ -31,6 +31,8 @@ class FileActions : public wxEvtHandler {
   bool Delete(const std::vector<std::string>& paths);
   void CopyTo(const std::vector<std::string>& paths, const std::string& folder);
   void MoveTo(const std::vector<std::string>& paths, const std::string& folder);
+  // Files were dropped on a folder.
+  void Drop(const std::vector<std::string>& paths, const std::string& folder, bool move);
   void Rename(const std::string& path, const std::string& name);
   // Several files at once, as the caller has planned it.
   void RenameAll(std::vector<FileStep> steps);
@@ -64,7 +66,7 @@ class FileActions : public wxEvtHandler {
   void Follow(const FileDeed& deed, bool back);
   void TellFailures(const std::vector<DeedFailure>& failures);
 
-  MainFrame& frame_;
+  Shell& shell_;
   UndoList undo_;
   std::thread thread_;
   std::atomic<bool> stop_{false};
@@ -72,9 +74,9 @@ class FileActions : public wxEvtHandler {
 };
 
 // Functions of the frame's menu.
-void TrashSelection(MainFrame& frame);
-void DeleteSelection(MainFrame& frame);
-void CopySelectionTo(MainFrame& frame);
-void MoveSelectionTo(MainFrame& frame);
+void TrashSelection(Shell& shell);
+void DeleteSelection(Shell& shell);
+void CopySelectionTo(Shell& shell);
+void MoveSelectionTo(Shell& shell);
 
 }  // namespace fotomill::desktop

@@ -6,7 +6,7 @@
 #include <algorithm>
 
 #include "desktop/models/shell/event_log.h"
-#include "desktop/windows/shell/main_frame.h"
+#include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/process.h"
 #include "platform/programs.h"
@@ -15,17 +15,17 @@ namespace fotomill::desktop {
 
 namespace {
 
-void Open(MainFrame& frame, const platform::Program& program, const std::vector<std::string>& files) {
+void Open(Shell& shell, const platform::Program& program, const std::vector<std::string>& files) {
   const auto starts = platform::StartsOf(program, files);
   const bool started = std::ranges::all_of(
       starts, [](const std::vector<std::string>& arguments) { return platform::RunProgram(arguments, false); });
   LogEvent("open-with", program.name + (started ? "" : " failed"));
-  frame.Tell(started ? program.name + " was started." : program.name + " could not be started.");
+  shell.Report(started ? program.name + " was started." : program.name + " could not be started.");
 }
 
 }  // namespace
 
-wxMenu* NewOpenWithMenu(MainFrame& frame, const std::vector<std::string>& files) {
+wxMenu* NewOpenWithMenu(Shell& shell, const std::vector<std::string>& files) {
   if (files.empty()) return nullptr;
   const std::vector<platform::Program> programs = platform::ProgramsFor(files.front());
   LogEvent("programs", std::to_string(programs.size()));
@@ -34,7 +34,7 @@ wxMenu* NewOpenWithMenu(MainFrame& frame, const std::vector<std::string>& files)
   for (const platform::Program& program : programs) {
     const int id = menu->Append(wxID_ANY, wxControl::EscapeMnemonics(Shown(program.name)))->GetId();
     menu->Bind(
-        wxEVT_MENU, [&frame, program, files](wxCommandEvent&) { Open(frame, program, files); }, id);
+        wxEVT_MENU, [&shell, program, files](wxCommandEvent&) { Open(shell, program, files); }, id);
   }
   return menu;
 }

@@ -7,9 +7,9 @@ class wxMenu;
 
 namespace fotomill::desktop {
 
-class MainFrame;
+class Shell;
 
 // A new menu of the programs registered for files like the first of these; each opens all of them. Null when there are none.
-wxMenu* NewOpenWithMenu(MainFrame& frame, const std::vector<std::string>& files);
+wxMenu* NewOpenWithMenu(Shell& shell, const std::vector<std::string>& files);
 
 }  // namespace fotomill::desktop

@@ -20,7 +20,8 @@
 #include "desktop/windows/batch/batch_runner.h"
 #include "desktop/windows/dialogs/help.h"
 #include "desktop/windows/files/file_actions.h"
-#include "desktop/windows/shell/main_frame.h"
+#include "desktop/windows/shell/browser_tabs.h"
+#include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/looks.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "files/rename_log.h"
@@ -200,18 +201,18 @@ bool SequentialRenameDialog::Ask() {
 }
 
 // What the last run renamed, for the frame's undo.
-void NoteRenames(MainFrame& frame) {
+void NoteRenames(Shell& shell) {
   FileDeed deed{DeedKind::Rename, {}};
   for (const RenamedFile& file : ReadRenameLog().value_or(std::vector<RenamedFile>())) deed.steps.push_back({file.from, file.to});
-  frame.Files().NoteDone(std::move(deed));
+  shell.Files().NoteDone(std::move(deed));
 }
 
 }  // namespace
 
-void RenameSelectionSequentially(MainFrame& frame) {
-  const std::vector<std::string> files = frame.SelectedFiles();
+void RenameSelectionSequentially(Shell& shell) {
+  const std::vector<std::string> files = shell.Tabs().SelectedFiles();
   if (files.empty()) return;
-  SequentialRenameDialog dialog(&frame, files);
+  SequentialRenameDialog dialog(&shell.Window(), files);
   LogEvent("prompt", "sequential-rename");
   if (!dialog.Ask()) return;
   (void)SaveConfiguration();
@@ -225,9 +226,9 @@ void RenameSelectionSequentially(MainFrame& frame) {
   };
   BatchJob job;
   job.rename = SequentialRenameFromSettings();
-  frame.Batches().Run(std::move(job), [batch = BatchFiles(files, files.size()), options, &frame](BatchJob& running) {
+  shell.Batches().Run(std::move(job), [batch = BatchFiles(files, files.size()), options, &shell](BatchJob& running) {
     RunRename(batch, options, running);
-    frame.CallAfter([&frame] { NoteRenames(frame); });
+    shell.Window().CallAfter([&shell] { NoteRenames(shell); });
     return Status::Ok;
   });
 }

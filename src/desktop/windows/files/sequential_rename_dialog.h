@@ -2,9 +2,9 @@
 
 namespace fotomill::desktop {
 
-class MainFrame;
+class Shell;
 
 // The box "Sequential Rename" for the frame's selection: numbers the files, shows their new names first.
-void RenameSelectionSequentially(MainFrame& frame);
+void RenameSelectionSequentially(Shell& shell);
 
 }  // namespace fotomill::desktop

@@ -11,8 +11,11 @@
 
 #include "core/choice_lists.h"
 #include "desktop/models/shell/event_log.h"
+#include "desktop/windows/history/use_recorder.h"
 #include "desktop/windows/setup/setup_box.h"
-#include "desktop/windows/shell/main_frame.h"
+#include "desktop/windows/shell/browser_tabs.h"
+#include "desktop/windows/shell/picture_windows.h"
+#include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/files.h"
 #include "platform/paths.h"
@@ -55,10 +58,10 @@ class FileHistoryBox::Lines : public wxDataViewVirtualListModel {
   const HistoryThumbnails& thumbnails_;
 };
 
-FileHistoryBox::FileHistoryBox(MainFrame& frame)
-    : wxDialog(&frame, wxID_ANY, kTitle, wxDefaultPosition, wxDefaultSize,
+FileHistoryBox::FileHistoryBox(Shell& shell)
+    : wxDialog(&shell.Window(), wxID_ANY, kTitle, wxDefaultPosition, wxDefaultSize,
                wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER | wxMAXIMIZE_BOX, "FileHistoryBox"),
-      frame_(frame),
+      shell_(shell),
       thumbnails_([this](const std::vector<std::string>& paths) {
         for (size_t row = 0; row < history_.Count(); ++row) {
           if (std::ranges::find(paths, history_.Row(row).path) != paths.end()) lines_->RowChanged(static_cast<unsigned>(row));
@@ -76,7 +79,7 @@ FileHistoryBox::FileHistoryBox(MainFrame& frame)
   SetSizer(column);
   Layout();
   AddColumns();
-  frame_.FlushUses();
+  shell_.Uses().Flush();
   readable_ = history_.Take();
   Refill();
   SetEscapeId(wxID_CLOSE);
@@ -193,9 +196,9 @@ void FileHistoryBox::ViewFile() {
     wxMessageBox("The file is no longer there. Remove takes its entry out of the list.", kTitle, wxOK | wxICON_INFORMATION, this);
     return;
   }
-  MainFrame& frame = frame_;
+  Shell& shell = shell_;
   EndModal(wxID_OPEN);
-  frame.CallAfter([&frame, path] { frame.ViewFiles({path}, path); });
+  shell.Window().CallAfter([&shell, path] { shell.Pictures().View({path}, path); });
 }
 
 void FileHistoryBox::ShowFolder() {
@@ -203,11 +206,11 @@ void FileHistoryBox::ShowFolder() {
   if (rows.size() != 1) return;
   const std::string path = history_.Row(rows.front()).path;
   const std::string folder(platform::SplitPath(path).folder);
-  MainFrame& frame = frame_;
+  Shell& shell = shell_;
   EndModal(wxID_OPEN);
-  frame.CallAfter([&frame, path, folder] {
+  shell.Window().CallAfter([&shell, path, folder] {
     const std::string trimmed = folder.size() > 1 ? folder.substr(0, folder.size() - 1) : folder;
-    if (BrowserPage* browser = frame.OpenTab(trimmed)) browser->Open(trimmed, std::string(platform::FileNameOf(path)));
+    if (BrowserPage* browser = shell.Tabs().Open(trimmed)) browser->Open(trimmed, std::string(platform::FileNameOf(path)));
   });
 }
 

@@ -12,12 +12,12 @@ class wxStaticText;
 
 namespace fotomill::desktop {
 
-class MainFrame;
+class Shell;
 
 // The file history: which files were used last, for what, and when.
 class FileHistoryBox : public wxDialog {
  public:
-  explicit FileHistoryBox(MainFrame& frame);
+  explicit FileHistoryBox(Shell& shell);
   ~FileHistoryBox() override;
 
  private:
@@ -36,7 +36,7 @@ class FileHistoryBox : public wxDialog {
   bool Confirm(const wxString& question, const wxString& verb);
   void KeepPlaces();
 
-  MainFrame& frame_;
+  Shell& shell_;
   FileHistoryList history_;
   bool readable_ = true;
   HistoryThumbnails thumbnails_;

@@ -9,9 +9,10 @@
 
 #include "catalog/history/file_history.h"
 #include "desktop/models/shell/event_log.h"
+#include "desktop/windows/history/use_recorder.h"
 #include "desktop/windows/info/report_tree.h"
 #include "desktop/windows/info/text_actions.h"
-#include "desktop/windows/shell/main_frame.h"
+#include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/button_row.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/paths.h"
@@ -29,10 +30,10 @@ constexpr int kProgressMs = 200;
 
 }  // namespace
 
-InfoFrame::InfoFrame(MainFrame& frame, wxWindow* parent, std::vector<std::string> paths)
+InfoFrame::InfoFrame(Shell& shell, wxWindow* parent, std::vector<std::string> paths)
     : wxFrame(parent, wxID_ANY, TitleOf(paths), wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE | wxFRAME_FLOAT_ON_PARENT,
               "InfoBox"),
-      frame_(frame),
+      shell_(shell),
       paths_(std::move(paths)) {
   const int gap = FromDIP(10);
   auto* panel = new wxPanel(this);
@@ -97,7 +98,7 @@ void InfoFrame::Finished() {
   for (const FileInfo& file : files_) {
     if (file.status == Status::Ok) uses.push_back({.path = file.path, .function = FileFunction::GetInfo});
   }
-  frame_.NoteUses(uses);
+  shell_.Uses().Note(uses);
   if (list_ != nullptr) {
     wxArrayString names;
     names.Add(wxString::Format("All %zu files", files_.size()));

@@ -16,13 +16,13 @@ class wxStaticText;
 
 namespace fotomill::desktop {
 
-class MainFrame;
+class Shell;
 class ReportTree;
 
 // "Get info": the facts of one file, or of several with their totals and differences. Files are read apart.
 class InfoFrame : public wxFrame {
  public:
-  InfoFrame(MainFrame& frame, wxWindow* parent, std::vector<std::string> paths);
+  InfoFrame(Shell& shell, wxWindow* parent, std::vector<std::string> paths);
 
  private:
   wxSizer* BuildButtons(wxWindow& panel);
@@ -30,7 +30,7 @@ class InfoFrame : public wxFrame {
   void ShowChoice();  // what the list at the left has selected
   std::string WholeText() const;
 
-  MainFrame& frame_;
+  Shell& shell_;
   const std::vector<std::string> paths_;
   std::vector<FileInfo> files_;  // written apart, then read here
   std::vector<InfoSection> summary_;

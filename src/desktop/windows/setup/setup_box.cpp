@@ -19,7 +19,7 @@
 #include "desktop/windows/batch/batch_runner.h"
 #include "desktop/windows/dialogs/help.h"
 #include "desktop/windows/setup/format_list.h"
-#include "desktop/windows/shell/main_frame.h"
+#include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/looks.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/files.h"
@@ -34,8 +34,8 @@ constexpr const char* kTransferFiles = "Settings (*.ini)|*.ini|All files|*";
 
 // Settings never change during a batch. False after a message when one is running.
 bool MayChangeSettings(wxWindow& window) {
-  auto* const frame = dynamic_cast<MainFrame*>(wxTheApp->GetTopWindow());
-  if (frame == nullptr || !frame->Batches().Running()) return true;
+  auto* const shell = dynamic_cast<Shell*>(wxTheApp->GetTopWindow());
+  if (shell == nullptr || !shell->Batches().Running()) return true;
   wxMessageBox("A batch is running with the settings as they are. Change them when it has ended.", kSetupTitle,
                wxOK | wxICON_INFORMATION, &window);
   return false;

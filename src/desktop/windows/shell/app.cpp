@@ -13,6 +13,7 @@
 #include "desktop/models/shell/event_log.h"
 #include "desktop/models/view/view_picture.h"
 #include "desktop/windows/setup/override_box.h"
+#include "desktop/windows/shell/frame_session.h"
 #include "desktop/windows/shell/main_frame.h"
 #include "desktop/windows/view/screen_profile.h"
 #include "desktop/windows/widgets/control_names.h"
@@ -78,7 +79,7 @@ class App : public wxApp {
     LogEvent("screen-profile", std::to_string(screen.size()));
     SetScreenProfile(std::move(screen));
     frame_ = new MainFrame;
-    frame_->RestorePlace();
+    frame_->Session().RestorePlace();
     frame_->Show();
     LogEvent("frame");
     frame_->OpenStart(argument_, true);

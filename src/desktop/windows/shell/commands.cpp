@@ -7,7 +7,12 @@
 #include "desktop/windows/dialogs/select_dialog.h"
 #include "desktop/windows/files/file_actions.h"
 #include "desktop/windows/files/sequential_rename_dialog.h"
-#include "desktop/windows/shell/main_frame.h"
+#include "desktop/windows/shell/browser_tabs.h"
+#include "desktop/windows/shell/folder_pane.h"
+#include "desktop/windows/shell/frame_session.h"
+#include "desktop/windows/shell/function_toolbar.h"
+#include "desktop/windows/shell/picture_windows.h"
+#include "desktop/windows/shell/shell.h"
 #include "desktop/windows/shell/tool_windows.h"
 
 namespace fotomill::desktop {
@@ -16,51 +21,51 @@ namespace {
 
 // A command of the browser in front.
 template <void (BrowserPage::*action)()>
-void OfBrowser(MainFrame& frame) {
-  if (BrowserPage* browser = frame.Browser()) (browser->*action)();
+void OfBrowser(Shell& shell) {
+  if (BrowserPage* browser = shell.Tabs().Front()) (browser->*action)();
 }
 
 template <int32_t view>
-void ShowAs(MainFrame& frame) {
-  if (BrowserPage* browser = frame.Browser()) browser->SetViewMode(view);
+void ShowAs(Shell& shell) {
+  if (BrowserPage* browser = shell.Tabs().Front()) browser->SetViewMode(view);
 }
 
 // Whether a mode of the browser in front has a value.
 template <int32_t BrowserModes::*mode, int32_t value>
-bool Has(const MainFrame& frame) {
-  const BrowserPage* browser = frame.Browser();
+bool Has(Shell& shell) {
+  const BrowserPage* browser = shell.Tabs().Front();
   return browser != nullptr && browser->Model().Modes().*mode == value;
 }
-bool HasFolders(const MainFrame& frame) { return frame.FoldersShown(); }
+bool HasFolders(Shell& shell) { return shell.Folders().Shown(); }
 
 template <int32_t mode>
-void ThumbnailsFrom(MainFrame& frame) {
-  if (BrowserPage* browser = frame.Browser()) browser->SetThumbnailMode(mode);
+void ThumbnailsFrom(Shell& shell) {
+  if (BrowserPage* browser = shell.Tabs().Front()) browser->SetThumbnailMode(mode);
 }
 
 // Sorts by a mode; chosen again, the other way round.
 template <int32_t sort>
-void SortBy(MainFrame& frame) {
-  BrowserPage* browser = frame.Browser();
+void SortBy(Shell& shell) {
+  BrowserPage* browser = shell.Tabs().Front();
   if (browser == nullptr) return;
   browser->SetSort(sort, browser->Model().Modes().sort == sort && !browser->Model().Descending());
 }
 
 template <void (Selection::*action)()>
-void Select(MainFrame& frame) {
-  BrowserPage* browser = frame.Browser();
+void Select(Shell& shell) {
+  BrowserPage* browser = shell.Tabs().Front();
   if (browser == nullptr) return;
   (browser->Model().Selected().*action)();
   browser->SelectionChanged();
 }
 
-void SelectByPattern(MainFrame& frame) {
-  BrowserPage* browser = frame.Browser();
-  if (browser != nullptr && AskAndSelect(frame, browser->Model())) browser->SelectionChanged();
+void SelectByPattern(Shell& shell) {
+  BrowserPage* browser = shell.Tabs().Front();
+  if (browser != nullptr && AskAndSelect(shell.Window(), browser->Model())) browser->SelectionChanged();
 }
 
-void SelectSameType(MainFrame& frame) {
-  if (BrowserPage* browser = frame.Browser()) {
+void SelectSameType(Shell& shell) {
+  if (BrowserPage* browser = shell.Tabs().Front()) {
     browser->Model().SelectSameType();
     browser->SelectionChanged();
   }
@@ -68,41 +73,41 @@ void SelectSameType(MainFrame& frame) {
 
 // A command of the frame's file actions.
 template <void (FileActions::*action)()>
-void OfFiles(MainFrame& frame) {
-  (frame.Files().*action)();
+void OfFiles(Shell& shell) {
+  (shell.Files().*action)();
 }
-void Cut(MainFrame& frame) { frame.Files().ToClipboard(frame.SelectedPaths(), true); }
-void Copy(MainFrame& frame) { frame.Files().ToClipboard(frame.SelectedPaths(), false); }
-void CopyPaths(MainFrame& frame) { frame.Files().PathsToClipboard(frame.SelectedPaths()); }
-void Paste(MainFrame& frame) { frame.Files().Paste(frame.CurrentFolder()); }
-void NewFolder(MainFrame& frame) { frame.Files().NewFolder(frame.CurrentFolder()); }
+void Cut(Shell& shell) { shell.Files().ToClipboard(shell.Tabs().SelectedPaths(), true); }
+void Copy(Shell& shell) { shell.Files().ToClipboard(shell.Tabs().SelectedPaths(), false); }
+void CopyPaths(Shell& shell) { shell.Files().PathsToClipboard(shell.Tabs().SelectedPaths()); }
+void Paste(Shell& shell) { shell.Files().Paste(shell.Tabs().CurrentFolder()); }
+void NewFolder(Shell& shell) { shell.Files().NewFolder(shell.Tabs().CurrentFolder()); }
 
 template <Orientation turn>
-void Turn(MainFrame& frame) {
-  TurnSelection(frame, turn);
+void Turn(Shell& shell) {
+  TurnSelection(shell, turn);
 }
-void NewTab(MainFrame& frame) { frame.OpenTab(frame.CurrentFolder()); }
-void CloseTab(MainFrame& frame) { frame.CloseTab(); }
-void ReopenTab(MainFrame& frame) { frame.ReopenTab(); }
-void SaveTabSet(MainFrame& frame) { frame.SaveTabSet(); }
-void OpenTabSet(MainFrame& frame) { frame.OpenTabSet(); }
-void NextTab(MainFrame& frame) { frame.StepTab(1); }
-void PreviousTab(MainFrame& frame) { frame.StepTab(-1); }
-void ChooseToolbar(MainFrame& frame) { frame.ChooseToolbar(); }
-void Quit(MainFrame& frame) { frame.Close(); }
-void ToggleFolders(MainFrame& frame) { frame.ShowFolders(!frame.FoldersShown()); }
-void ReadFoldersAgain(MainFrame& frame) { frame.FilesChanged(); }
-void ToggleFavourite(MainFrame& frame) { frame.ToggleFavourite(frame.CurrentFolder()); }
-bool IsFavourite(const MainFrame& frame) { return frame.IsFavourite(frame.CurrentFolder()); }
-void Larger(MainFrame& frame) {
-  if (BrowserPage* browser = frame.Browser()) browser->ChangeSize(1);
+void NewTab(Shell& shell) { shell.Tabs().Open(shell.Tabs().CurrentFolder()); }
+void CloseTab(Shell& shell) { shell.Tabs().Close(); }
+void ReopenTab(Shell& shell) { shell.Tabs().Reopen(); }
+void SaveTabSet(Shell& shell) { shell.Session().SaveTabSet(); }
+void OpenTabSet(Shell& shell) { shell.Session().OpenTabSet(); }
+void NextTab(Shell& shell) { shell.Tabs().Step(1); }
+void PreviousTab(Shell& shell) { shell.Tabs().Step(-1); }
+void ChooseToolbar(Shell& shell) { shell.Toolbar().Choose(); }
+void Quit(Shell& shell) { shell.Window().Close(); }
+void ToggleFolders(Shell& shell) { shell.Folders().Show(!shell.Folders().Shown()); }
+void ReadFoldersAgain(Shell& shell) { shell.FilesChanged(); }
+void ToggleFavourite(Shell& shell) { shell.Folders().ToggleFavourite(shell.Tabs().CurrentFolder()); }
+bool IsFavourite(Shell& shell) { return shell.Folders().IsFavourite(shell.Tabs().CurrentFolder()); }
+void Larger(Shell& shell) {
+  if (BrowserPage* browser = shell.Tabs().Front()) browser->ChangeSize(1);
 }
-void Smaller(MainFrame& frame) {
-  if (BrowserPage* browser = frame.Browser()) browser->ChangeSize(-1);
+void Smaller(Shell& shell) {
+  if (BrowserPage* browser = shell.Tabs().Front()) browser->ChangeSize(-1);
 }
-void View(MainFrame& frame) {
-  const std::vector<std::string> files = frame.SelectedFiles();
-  if (!files.empty()) frame.ViewFile(files.front());
+void View(Shell& shell) {
+  const std::vector<std::string> files = shell.Tabs().SelectedFiles();
+  if (!files.empty()) shell.Pictures().ViewFromBrowser(files.front());
 }
 
 constexpr const char* kFile = "&File";
@@ -208,6 +213,37 @@ constexpr Command kCommands[] = {
 }  // namespace
 
 std::span<const Command> Commands() { return kCommands; }
+
+const Command& CommandOfId(int id) { return kCommands[id - kFirstCommandId]; }
+
+bool IsCommandId(int id) { return id >= kFirstCommandId && id < kFirstCommandId + static_cast<int>(std::size(kCommands)); }
+
+bool CanRun(const Command& command, Shell& shell) {
+  const BrowserPage* browser = shell.Tabs().Front();
+  switch (command.needs) {
+    case Needs::Files: return browser != nullptr && browser->Model().HasFileForFunction();
+    case Needs::Few: return browser != nullptr && CompareFrame::Takes(browser->Model().Selected().SelectedCount());
+    case Needs::Item: return browser != nullptr && browser->Model().HasPathForFunction();
+    case Needs::ClosedTab: return shell.Tabs().HasClosed();
+    case Needs::Undo: return shell.Files().Undoable().CanUndo() && !shell.Files().Busy();
+    case Needs::Redo: return shell.Files().Undoable().CanRedo() && !shell.Files().Busy();
+    case Needs::Nothing: break;
+  }
+  return true;
+}
+
+const char* WhyNot(Needs needs) {
+  switch (needs) {
+    case Needs::Files: return "No picture is selected.";
+    case Needs::Few: return "Two to four pictures have to be selected.";
+    case Needs::Item: return "No file or folder is selected.";
+    case Needs::Undo: return "There is nothing to take back.";
+    case Needs::Redo: return "There is nothing to do again.";
+    case Needs::ClosedTab: return "No tab was closed.";
+    case Needs::Nothing: break;
+  }
+  return "";
+}
 
 const Command* CommandOfSymbol(std::string_view symbol) {
   const auto has = [symbol](const Command& command) { return command.symbol != nullptr && command.symbol == symbol; };

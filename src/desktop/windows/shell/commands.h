@@ -7,7 +7,7 @@
 
 namespace fotomill::desktop {
 
-class MainFrame;
+class Shell;
 
 // When a command can be used; where it cannot, its menu item and button are gray.
 enum class Needs {
@@ -28,11 +28,11 @@ struct Command {
   const char* accelerator = "";  // as wxWidgets writes them, empty for none
   const char* help = "";         // one sentence for the status bar
   Needs needs = Needs::Nothing;
-  void (*run)(MainFrame& frame) = nullptr;
-  const char* symbol = nullptr;                       // of the button in the toolbar (bitmaps.cpp), null for no button
-  bool inContextMenu = false;                         // of a file in a browser
-  bool (*checked)(const MainFrame& frame) = nullptr;  // whether its menu item has a mark; null for one that never has
-  const char* secondKey = nullptr;                    // that does the same
+  void (*run)(Shell& shell) = nullptr;
+  const char* symbol = nullptr;             // of the button in the toolbar (bitmaps.cpp), null for no button
+  bool inContextMenu = false;               // of a file in a browser
+  bool (*checked)(Shell& shell) = nullptr;  // whether its menu item has a mark; null for one that never has
+  const char* secondKey = nullptr;          // that does the same
 };
 
 std::span<const Command> Commands();
@@ -42,5 +42,13 @@ const Command* CommandOfSymbol(std::string_view symbol);
 // The id of a row's menu item and button.
 inline constexpr int kFirstCommandId = wxID_HIGHEST + 100;
 inline int CommandId(const Command& command) { return kFirstCommandId + static_cast<int>(&command - Commands().data()); }
+bool IsCommandId(int id);
+// The command of such an id.
+const Command& CommandOfId(int id);
+
+// Whether a command can be used at present.
+bool CanRun(const Command& command, Shell& shell);
+// What is missing where a command cannot be used, as a sentence.
+const char* WhyNot(Needs needs);
 
 }  // namespace fotomill::desktop

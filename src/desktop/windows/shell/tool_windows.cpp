@@ -9,37 +9,38 @@
 #include "desktop/windows/info/exif_frame.h"
 #include "desktop/windows/info/info_frame.h"
 #include "desktop/windows/setup/setup_box.h"
-#include "desktop/windows/shell/main_frame.h"
+#include "desktop/windows/shell/browser_tabs.h"
+#include "desktop/windows/shell/shell.h"
 #include "settings/setup_dialog.h"
 
 namespace fotomill::desktop {
 
-void ShowSetup(MainFrame& frame) {
-  SetupBox(&frame, [&frame] { frame.SettingsChanged(); }).ShowModal();
+void ShowSetup(Shell& shell) {
+  SetupBox(&shell.Window(), [&shell] { shell.SettingsChanged(); }).ShowModal();
   LogEvent("setup", "closed");
 }
 
-void ShowInfo(MainFrame& frame) {
-  std::vector<std::string> files = frame.SelectedFiles();
-  if (!files.empty()) (new InfoFrame(frame, &frame, std::move(files)))->Show();
+void ShowInfo(Shell& shell) {
+  std::vector<std::string> files = shell.Tabs().SelectedFiles();
+  if (!files.empty()) (new InfoFrame(shell, &shell.Window(), std::move(files)))->Show();
 }
 
-void ShowExif(MainFrame& frame) {
-  const std::vector<std::string> files = frame.SelectedFiles();
-  if (!files.empty()) (new ExifFrame(&frame, files.front()))->Show();
+void ShowExif(Shell& shell) {
+  const std::vector<std::string> files = shell.Tabs().SelectedFiles();
+  if (!files.empty()) (new ExifFrame(&shell.Window(), files.front()))->Show();
 }
 
-void ShowFileHistory(MainFrame& frame) {
-  FileHistoryBox(frame).ShowModal();
+void ShowFileHistory(Shell& shell) {
+  FileHistoryBox(shell).ShowModal();
   LogEvent("history", "closed");
 }
-void ShowCompaction(MainFrame& frame) { CompactionBox(&frame, frame.CurrentFolder()).ShowModal(); }
-void ShowCleanUp(MainFrame& frame) {
-  CleanUpBox(&frame, frame.CurrentFolder()).ShowModal();
+void ShowCompaction(Shell& shell) { CompactionBox(&shell.Window(), shell.Tabs().CurrentFolder()).ShowModal(); }
+void ShowCleanUp(Shell& shell) {
+  CleanUpBox(&shell.Window(), shell.Tabs().CurrentFolder()).ShowModal();
   LogEvent("cleanup", "closed");
 }
-void ShowPlugins(MainFrame& frame) { PluginBox(&frame).ShowModal(); }
-void ShowManual(MainFrame& frame) { ShowHelp(frame, kManual); }
-void ShowConfigurationHelp(MainFrame& frame) { ShowHelp(frame, kGeneralHelpPage); }
+void ShowPlugins(Shell& shell) { PluginBox(&shell.Window()).ShowModal(); }
+void ShowManual(Shell& shell) { ShowHelp(shell.Window(), kManual); }
+void ShowConfigurationHelp(Shell& shell) { ShowHelp(shell.Window(), kGeneralHelpPage); }
 
 }  // namespace fotomill::desktop

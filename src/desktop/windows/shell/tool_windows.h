@@ -2,17 +2,17 @@
 
 namespace fotomill::desktop {
 
-class MainFrame;
+class Shell;
 
 // The windows beside browser and view window, as commands of the frame.
-void ShowSetup(MainFrame& frame);
-void ShowInfo(MainFrame& frame);  // of the selected files
-void ShowExif(MainFrame& frame);  // of the first selected file
-void ShowFileHistory(MainFrame& frame);
-void ShowCompaction(MainFrame& frame);
-void ShowCleanUp(MainFrame& frame);  // of the folder in front
-void ShowPlugins(MainFrame& frame);
-void ShowManual(MainFrame& frame);
-void ShowConfigurationHelp(MainFrame& frame);
+void ShowSetup(Shell& shell);
+void ShowInfo(Shell& shell);  // of the selected files
+void ShowExif(Shell& shell);  // of the first selected file
+void ShowFileHistory(Shell& shell);
+void ShowCompaction(Shell& shell);
+void ShowCleanUp(Shell& shell);  // of the folder in front
+void ShowPlugins(Shell& shell);
+void ShowManual(Shell& shell);
+void ShowConfigurationHelp(Shell& shell);
 
 }  // namespace fotomill::desktop

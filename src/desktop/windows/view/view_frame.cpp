@@ -11,8 +11,10 @@
 #include "desktop/models/drawing/rgb_image.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/files/file_actions.h"
+#include "desktop/windows/history/use_recorder.h"
 #include "desktop/windows/info/info_frame.h"
-#include "desktop/windows/shell/main_frame.h"
+#include "desktop/windows/shell/browser_tabs.h"
+#include "desktop/windows/shell/shell.h"
 #include "desktop/windows/view/view_commands.h"
 #include "desktop/windows/widgets/bitmaps.h"
 #include "desktop/windows/widgets/screen_reader.h"
@@ -32,9 +34,10 @@ constexpr int kPointerMs = 2000;
 
 }  // namespace
 
-ViewFrame::ViewFrame(MainFrame& frame, const std::vector<std::string>& list, const std::string& file)
-    : wxFrame(&frame, wxID_ANY, "View", wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE, "FotomillProfessionalView"),
-      frame_(frame),
+ViewFrame::ViewFrame(Shell& shell, const std::vector<std::string>& list, const std::string& file)
+    : wxFrame(&shell.Window(), wxID_ANY, "View", wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE,
+              "FotomillProfessionalView"),
+      shell_(shell),
       list_(list),
       pointerTimer_(this),
       slideshow_({.busy = [this] { return animation_->MustFinish(); }, .show = [this](size_t place) { GoTo(place); }}) {
@@ -43,7 +46,7 @@ ViewFrame::ViewFrame(MainFrame& frame, const std::vector<std::string>& list, con
     list_ = {file};
     place_ = 0;
   }
-  SetSize(frame.GetSize());
+  SetSize(shell.Window().GetSize());
   loader_ = std::make_unique<ViewLoader>(kAheadBytes, [this] { CallAfter([this] { PictureCame(); }); });
   canvas_ = new ViewCanvas(
       this, {.resized = [this] { Resized(); }, .changed = [this] { ViewChanged(); }, .painted = [this] { LogPaint(); }});
@@ -79,7 +82,7 @@ ViewFrame::~ViewFrame() {
   // Their threads call back into this window.
   animation_.reset();
   loader_.reset();
-  if (shown_) frame_.CallAfter(shown_);
+  if (shown_) shell_.Window().CallAfter(shown_);
 }
 
 // --- which picture ---
@@ -153,7 +156,7 @@ bool ViewFrame::AskForPicture() {
 
 // Until the picture is there its thumbnail stands in, where the browser has one.
 void ViewFrame::ShowStandIn() {
-  const ThumbnailPointer thumbnail = frame_.Thumbnails().FindAny(list_[place_]);
+  const ThumbnailPointer thumbnail = shell_.Thumbnails().FindAny(list_[place_]);
   PackedImage image;
   if (thumbnail == nullptr || thumbnail->pixels.Empty() || ToPacked(thumbnail->pixels, image) != Status::Ok) return;
   constexpr int32_t kUnknown = 16;  // times the thumbnail, where its picture's size is not known
@@ -192,20 +195,20 @@ void ViewFrame::TakePicture(ViewPicturePointer picture) {
                        " page=" + std::to_string(page_ + 1) + " status=" + std::to_string(StatusNumber(picture->status)) +
                        " ms=" + std::to_string(std::lround((platform::MonotonicSeconds() - keyTime_) * 1000)) +
                        " file=" + list_[place_]);
-  if (picture->picture != nullptr) frame_.NoteUses({FileUse{list_[place_], FileFunction::View}});
+  if (picture->picture != nullptr) shell_.Uses().Note({FileUse{list_[place_], FileFunction::View}});
   loaded_ = std::move(picture);
   ShowTurned();
   animation_->Begin(loaded_);
   slideshow_.ShownAt(place_, list_.size());
-  if (shown_) frame_.CallAfter(std::exchange(shown_, nullptr));
+  if (shown_) shell_.Window().CallAfter(std::exchange(shown_, nullptr));
 }
 
 void ViewFrame::WhenShown(std::function<void()> shown) {
-  if (IsCurrent(loaded_)) return frame_.CallAfter(shown);  // a small one may have come already
+  if (IsCurrent(loaded_)) return shell_.Window().CallAfter(shown);  // a small one may have come already
   shown_ = std::move(shown);
 }
 
-bool ViewFrame::TakeList(const std::vector<std::string>& list) {
+bool ViewFrame::UseList(const std::vector<std::string>& list) {
   const auto found = std::ranges::find(list, list_[place_]);
   if (found == list.end()) return false;
   place_ = static_cast<size_t>(found - list.begin());
@@ -310,7 +313,7 @@ void ViewFrame::ChooseSlideshow() {
   if (slideshow_.Choose(*this)) ToggleSlideshow();
 }
 
-void ViewFrame::ShowInfoWindow() { (new InfoFrame(frame_, this, {list_[place_]}))->Show(); }
+void ViewFrame::ShowInfoWindow() { (new InfoFrame(shell_, this, {list_[place_]}))->Show(); }
 
 void ViewFrame::ToggleOverlay() {
   overlay_ = !overlay_;
@@ -328,13 +331,13 @@ void ViewFrame::SettingSwitched() {
 void ViewFrame::Leave() {
   slideshow_.Stop();
   if (IsFullScreen()) return ToggleFullScreen();
-  if (BrowserPage* browser = frame_.Browser()) browser->FocusName(std::string(platform::FileNameOf(list_[place_])));
+  if (BrowserPage* browser = shell_.Tabs().Front()) browser->FocusName(std::string(platform::FileNameOf(list_[place_])));
   Close();
 }
 
 void ViewFrame::DeleteFile() {
   const std::string path = list_[place_];
-  if (!frame_.Files().TrashFromView(this, path)) return;
+  if (!shell_.Files().TrashFromView(this, path)) return;
   loader_->Forget(path);
   // A slideshow may have gone on while the user was asked.
   const auto gone = std::ranges::find(list_, path);
@@ -368,7 +371,7 @@ void ViewFrame::SaveTurned() {
   if (saving_ || turn_ == Orientation::Upright) return SetStatusText("The picture is as its file has it.");
   const std::string path = list_[place_];
   const wxWeakRef<ViewFrame> self(this);
-  saving_ = frame_.Files().SaveTurned(path, turn_, [self, path](bool done, const std::string& note) {
+  saving_ = shell_.Files().SaveTurned(path, turn_, [self, path](bool done, const std::string& note) {
     if (!self) return;
     self->saving_ = false;
     if (done) self->FilesChanged();
@@ -387,12 +390,12 @@ void ViewFrame::FilesChanged() {
 
 void ViewFrame::Undo() {
   if (saving_) return wxBell();
-  if (turn_ == Orientation::Upright || loaded_ == nullptr) return frame_.Files().Undo();
+  if (turn_ == Orientation::Upright || loaded_ == nullptr) return shell_.Files().Undo();
   turn_ = Orientation::Upright;
   ShowTurned();
 }
 
-void ViewFrame::Redo() { frame_.Files().Redo(); }
+void ViewFrame::Redo() { shell_.Files().Redo(); }
 
 void ViewFrame::CopyPicture() {
   const ViewPicturePointer& shown = canvas_->Picture();

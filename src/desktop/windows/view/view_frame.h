@@ -15,12 +15,12 @@
 
 namespace fotomill::desktop {
 
-class MainFrame;
+class Shell;
 
 // A view window: one picture at a time, with its neighbours of the list that it was opened from decoded ahead.
 class ViewFrame : public wxFrame {
  public:
-  ViewFrame(MainFrame& frame, const std::vector<std::string>& list, const std::string& file);
+  ViewFrame(Shell& shell, const std::vector<std::string>& list, const std::string& file);
   ~ViewFrame() override;
 
   // Commands, by keys and menu.
@@ -47,7 +47,7 @@ class ViewFrame : public wxFrame {
   // Calls once when the first picture is there, or the window goes without.
   void WhenShown(std::function<void()> shown);
   // The files that neighbour the picture from here on. False when it is not among them; they are as before then.
-  bool TakeList(const std::vector<std::string>& list);
+  bool UseList(const std::vector<std::string>& list);
   size_t LastPlace() const { return list_.size() - 1; }
   ViewCanvas& Canvas() { return *canvas_; }
 
@@ -72,7 +72,7 @@ class ViewFrame : public wxFrame {
   void ShowTurned();
   ViewPicturePointer Turned(const ViewPicturePointer& picture) const;
 
-  MainFrame& frame_;
+  Shell& shell_;
   std::vector<std::string> list_;
   size_t place_ = 0;
   int32_t page_ = 0;

@@ -1,0 +1,22 @@
+#pragma once
+
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace fotomill::desktop {
+
+// The folders of the tabs that were closed last, TabHistoryMax at most. They are kept for later runs.
+class ClosedTabs {
+ public:
+  void Load();
+  bool Empty() const { return folders_.empty(); }
+  void Add(const std::string& folder);
+  // The folder of the tab closed last, which is forgotten; none when there is none.
+  std::optional<std::string> Pop();
+
+ private:
+  std::vector<std::string> folders_;  // the latest last
+};
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,237 @@
+#include "desktop/windows/shell/browser_tabs.h"
+
+#include <wx/aui/auibook.h>
+#include <wx/frame.h>
+
+#include "desktop/models/shell/event_log.h"
+#include "desktop/models/shell/favourites.h"
+#include "desktop/windows/files/file_actions.h"
+#include "desktop/windows/shell/frame_menus.h"
+#include "desktop/windows/shell/picture_windows.h"
+#include "desktop/windows/shell/shell.h"
+#include "desktop/windows/widgets/wx_text.h"
+#include "platform/files.h"
+#include "platform/folders.h"
+#include "platform/paths.h"
+#include "settings/settings.h"
+
+namespace fotomill::desktop {
+
+namespace {
+
+constexpr int kViewsMs = 2000;  // after the last change
+
+}  // namespace
+
+wxString FolderLabel(const std::string& folder) { return folder == "/" ? wxString("/") : Shown(platform::FileNameOf(folder)); }
+
+BrowserTabs::BrowserTabs(wxWindow* parent, Shell& shell, FrameMenus& menus, std::function<void()> changed)
+    : shell_(shell), menus_(menus), changed_(std::move(changed)) {
+  views_.Load();
+  closed_.Load();
+  viewsTimer_.Bind(wxEVT_TIMER, [this](wxTimerEvent&) { (void)views_.Save(); });
+  book_ = new wxAuiNotebook(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize,
+                            wxAUI_NB_TOP | wxAUI_NB_TAB_MOVE | wxAUI_NB_SCROLL_BUTTONS | wxAUI_NB_CLOSE_ON_ALL_TABS |
+                                wxAUI_NB_MIDDLE_CLICK_CLOSE | wxBORDER_NONE);
+  book_->SetArtProvider(new wxAuiGenericTabArt);
+  book_->Bind(wxEVT_AUINOTEBOOK_PAGE_CHANGED, &BrowserTabs::OnTabChanged, this);
+  book_->Bind(wxEVT_AUINOTEBOOK_PAGE_CLOSE, [this](wxAuiNotebookEvent& event) {
+    if (book_->GetPageCount() == 1) return event.Veto();
+    closed_.Add(PageAt(static_cast<size_t>(event.GetSelection()))->Model().Folder());
+  });
+}
+
+wxWindow& BrowserTabs::Window() const { return *book_; }
+
+// --- the browser in front ---
+
+BrowserPage* BrowserTabs::PageAt(size_t tab) const { return static_cast<BrowserPage*>(book_->GetPage(tab)); }
+
+BrowserPage* BrowserTabs::Front() const {
+  const int tab = book_->GetSelection();
+  return tab == wxNOT_FOUND ? nullptr : PageAt(static_cast<size_t>(tab));
+}
+
+std::vector<std::string> BrowserTabs::SelectedFiles() const {
+  const BrowserPage* browser = Front();
+  return browser == nullptr ? std::vector<std::string>() : browser->Model().FilesForFunction();
+}
+
+std::vector<std::string> BrowserTabs::SelectedPaths() const {
+  const BrowserPage* browser = Front();
+  return browser == nullptr ? std::vector<std::string>() : browser->Model().PathsForFunction();
+}
+
+std::string BrowserTabs::CurrentFolder() const {
+  const BrowserPage* browser = Front();
+  return browser == nullptr ? platform::CurrentFolder() : browser->Model().Folder();
+}
+
+void BrowserTabs::SelectFiles(const std::vector<std::string>& files) {
+  BrowserPage* browser = Front();
+  if (browser == nullptr) return;
+  BrowserModel& model = browser->Model();
+  model.Selected().SelectNone();
+  for (const std::string& file : files) {
+    const size_t line = platform::SplitPath(file).folder == platform::JoinFolder(model.Folder(), "")
+                            ? model.FindLine(platform::FileNameOf(file))
+                            : kNoLine;
+    if (line != kNoLine) model.Selected().Set(line, true);
+  }
+  browser->SelectionChanged();
+}
+
+// --- tabs ---
+
+BrowserPage* BrowserTabs::Open(const std::string& folder) {
+  FolderView view{{settings.DefaultThumbnailMode, settings.DefaultViewMode, settings.DefaultSortMode}};
+  if (const BrowserPage* browser = Front()) view = browser->Model().View();
+  auto* page = new BrowserPage(book_, *this, shell_.Thumbnails(), view);
+  book_->AddPage(page, FolderLabel(folder), true);
+  page->Open(folder);
+  page->FocusList();
+  return page;
+}
+
+BrowserPage* BrowserTabs::Show(const std::string& folder) {
+  for (size_t tab = 0; tab < book_->GetPageCount(); ++tab) {
+    if (PageAt(tab)->Model().Folder() != folder) continue;
+    book_->SetSelection(tab);
+    return PageAt(tab);
+  }
+  return Open(folder);
+}
+
+void BrowserTabs::Close() {
+  const int tab = book_->GetSelection();
+  if (tab == wxNOT_FOUND || book_->GetPageCount() == 1) return;
+  closed_.Add(PageAt(static_cast<size_t>(tab))->Model().Folder());
+  book_->DeletePage(static_cast<size_t>(tab));
+}
+
+void BrowserTabs::Reopen() {
+  const auto folder = closed_.Pop();
+  if (!folder) return;
+  if (!platform::IsFolder(*folder)) return shell_.Report(*folder + " is not there any more.");
+  Open(*folder);
+}
+
+void BrowserTabs::Step(int step) {
+  const int count = static_cast<int>(book_->GetPageCount());
+  if (count > 1) book_->SetSelection(static_cast<size_t>((book_->GetSelection() + step + count) % count));
+}
+
+void BrowserTabs::OnTabChanged(wxAuiNotebookEvent& event) {
+  const int left = event.GetOldSelection();
+  if (left != wxNOT_FOUND && static_cast<size_t>(left) < book_->GetPageCount()) PageAt(static_cast<size_t>(left))->KeepColumns();
+  for (wxWindow* const window : book_->GetChildren()) {
+    if (dynamic_cast<wxAuiTabCtrl*>(window) != nullptr) window->SetName("Tabs");
+  }
+  if (BrowserPage* browser = Front()) {
+    browser->Activated();
+    shell_.Window().CallAfter([this] {
+      if (BrowserPage* shown = Front()) shown->FocusList();
+    });
+  }
+  BrowserChanged();
+  event.Skip();
+}
+
+void BrowserTabs::Reload() {
+  for (size_t tab = 0; tab < book_->GetPageCount(); ++tab) PageAt(tab)->Reload();
+}
+
+void BrowserTabs::FollowRename(const std::string& from, const std::string& to) {
+  for (size_t tab = 0; tab < book_->GetPageCount(); ++tab) {
+    const std::string& folder = PageAt(tab)->Model().Folder();
+    if (LiesIn(folder, from)) PageAt(tab)->Open(RenamedPath(folder, from, to));
+  }
+}
+
+// --- what is kept ---
+
+void BrowserTabs::Restore(const Session& session) {
+  const size_t first = book_->GetPageCount();
+  for (const SessionTab& tab : session.tabs) {
+    auto* page = new BrowserPage(book_, *this, shell_.Thumbnails(), tab.view);
+    book_->AddPage(page, FolderLabel(tab.folder));
+    book_->SetPageToolTip(book_->GetPageCount() - 1, Shown(tab.folder));
+    page->Open(tab.folder, tab.focus);
+    page->RestoreScroll(tab.scroll);
+  }
+  book_->SetSelection(first + session.tab);
+  if (BrowserPage* browser = Front()) {
+    browser->Activated();
+    browser->FocusList();
+  }
+  BrowserChanged();
+}
+
+void BrowserTabs::Replace(const Session& session) {
+  const size_t old = book_->GetPageCount();
+  Restore(session);
+  for (size_t tab = 0; tab < old; ++tab) book_->DeletePage(0);
+}
+
+void BrowserTabs::Keep(Session& session) {
+  if (BrowserPage* browser = Front()) {
+    session.tab = static_cast<size_t>(book_->GetSelection());
+    browser->KeepColumns();
+  }
+  session.columns = DetailColumnsText(columns_);
+  for (size_t tab = 0; tab < book_->GetPageCount(); ++tab) {
+    const BrowserModel& model = PageAt(tab)->Model();
+    const size_t focus = model.Selected().Focus();
+    session.tabs.push_back(
+        {model.Folder(), model.View(), PageAt(tab)->Scroll(), focus == kNoLine ? std::string() : model.Line(focus).name});
+  }
+  (void)views_.Save();
+}
+
+// --- what browsers ask for ---
+
+void BrowserTabs::BrowserChanged() {
+  const BrowserPage* browser = Front();
+  if (browser == nullptr) return;
+  const std::string& folder = browser->Model().Folder();
+  const size_t tab = static_cast<size_t>(book_->GetSelection());
+  if (book_->GetPageText(tab) != FolderLabel(folder)) book_->SetPageText(tab, FolderLabel(folder));
+  if (book_->GetPageToolTip(tab) != Shown(folder)) book_->SetPageToolTip(tab, Shown(folder));
+  changed_();
+  LogState();
+}
+
+void BrowserTabs::KeepView(const std::string& folder, const FolderView& view) {
+  views_.Keep(folder, view);
+  viewsTimer_.StartOnce(kViewsMs);
+}
+
+void BrowserTabs::ViewFile(const std::string& path) { shell_.Pictures().ViewFromBrowser(path); }
+
+void BrowserTabs::ShowContextMenu(wxWindow& window, const wxPoint& place, bool onFile) {
+  if (onFile) menus_.ShowContextMenu(window, place);
+}
+
+void BrowserTabs::RenameFile(const std::string& path, const std::string& name) { shell_.Files().Rename(path, name); }
+
+void BrowserTabs::DropFiles(const std::vector<std::string>& files, const std::string& folder, bool move) {
+  shell_.Files().Drop(files, folder, move);
+}
+
+void BrowserTabs::LogState() {
+  const BrowserPage* browser = Front();
+  if (!EventLogOn() || browser == nullptr) return;
+  const BrowserModel& model = browser->Model();
+  const size_t focus = model.Selected().Focus();
+  std::string state =
+      "tabs=" + std::to_string(book_->GetPageCount()) + " lines=" + std::to_string(model.LineCount()) +
+      " items=" + std::to_string(model.ItemCount()) + " selected=" + std::to_string(model.Selected().SelectedCount()) +
+      " missing=" + std::to_string(browser->MissingThumbnails()) + " listing=" + std::to_string(browser->Listing()) +
+      " view=" + std::to_string(model.Modes().view) + " sort=" + std::to_string(model.Modes().sort) +
+      " focus=" + (focus == kNoLine ? std::string("-") : model.Line(focus).name) + " folder=" + model.Folder();
+  if (state == loggedState_) return;
+  loggedState_ = state;
+  LogEvent("browser", state);
+}
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,89 @@
+#include "desktop/windows/shell/frame_session.h"
+
+#include <wx/frame.h>
+#include <wx/msgdlg.h>
+
+#include <algorithm>
+#include <utility>
+
+#include "desktop/models/shell/event_log.h"
+#include "desktop/models/shell/tab_sets.h"
+#include "desktop/windows/dialogs/tab_set_box.h"
+#include "desktop/windows/shell/browser_tabs.h"
+#include "desktop/windows/shell/shell.h"
+#include "settings/configuration.h"
+#include "settings/settings.h"
+
+namespace fotomill::desktop {
+
+void FrameSession::RestorePlace() {
+  const Session session = LoadSession();
+  wxFrame& frame = shell_.Window();
+  if (session.width > 0 && session.height > 0)
+    frame.SetSize(frame.FromDIP(wxSize(std::max(session.width, 400), std::max(session.height, 300))));
+  if (session.maximized) frame.Maximize();
+  shell_.Tabs().SetColumns(session.columns);
+  if (settings.RememberOpenWindows != 0) lastTabs_ = session;
+}
+
+bool FrameSession::RestoreTabs() {
+  if (lastTabs_.tabs.empty()) return false;
+  shell_.Tabs().Restore(std::exchange(lastTabs_, {}));
+  return true;
+}
+
+bool FrameSession::Keep(bool withTabs) {
+  const wxFrame& frame = shell_.Window();
+  Session session;
+  session.maximized = frame.IsMaximized();
+  if (session.maximized) {  // the size to come back to is the last one before
+    const Session last = LoadSession();
+    session.width = last.width;
+    session.height = last.height;
+  } else {
+    const wxSize size = frame.ToDIP(frame.GetSize());
+    session.width = size.x;
+    session.height = size.y;
+  }
+  session.tab = lastTabs_.tab;
+  shell_.Tabs().Keep(session);
+  if (withTabs) {
+    session.tabs.insert(session.tabs.end(), lastTabs_.tabs.begin(), lastTabs_.tabs.end());
+  } else {
+    session.tabs.clear();
+  }
+  return SaveSession(session);
+}
+
+// The tabs under a name of their own, to which they are also written in the end.
+void FrameSession::SaveTabSet() {
+  const auto name = AskForTabSetName(shell_.Window());
+  if (!name) return;
+  const SettingText before = std::exchange(settings.TabsetCurrentName, SettingText(TabSetFile(*name)));
+  if (!Keep(true)) {
+    settings.TabsetCurrentName = before;
+    wxMessageBox("The tab set could not be written.", "Fotomill Professional", wxOK | wxICON_WARNING, &shell_.Window());
+    return;
+  }
+  (void)SaveConfiguration();
+  LogEvent("tab-set", "saved " + *name);
+}
+
+// Other tabs come in the place of those that are open, which their own set keeps.
+void FrameSession::OpenTabSet() {
+  const auto name = ChooseTabSet(shell_.Window());
+  if (!name || *name == CurrentTabSet()) return;
+  if (!Keep(true)) return shell_.Report("The tabs that are open could not be kept, so they stay.");
+  const SettingText before = std::exchange(settings.TabsetCurrentName, SettingText(TabSetFile(*name)));
+  const Session session = LoadSession();
+  if (session.tabs.empty()) {
+    settings.TabsetCurrentName = before;
+    return shell_.Report("The folders of this tab set are not there any more.");
+  }
+  lastTabs_ = {};
+  shell_.Tabs().Replace(session);
+  (void)SaveConfiguration();
+  LogEvent("tab-set", "opened " + *name);
+}
+
+}  // namespace fotomill::desktop

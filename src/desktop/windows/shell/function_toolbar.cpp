@@ -1,0 +1,59 @@
+#include "desktop/windows/shell/function_toolbar.h"
+
+#include <wx/frame.h>
+#include <wx/toolbar.h>
+
+#include <string>
+
+#include "desktop/models/shell/event_log.h"
+#include "desktop/windows/dialogs/toolbar_box.h"
+#include "desktop/windows/shell/commands.h"
+#include "desktop/windows/shell/shell.h"
+#include "desktop/windows/widgets/bitmaps.h"
+
+namespace fotomill::desktop {
+
+FunctionToolbar::FunctionToolbar(Shell& shell)
+    : shell_(shell),
+      bar_(shell.Window().CreateToolBar(wxTB_FLAT | wxTB_HORIZONTAL | wxTB_TEXT | wxTB_NODIVIDER, wxID_ANY, "Functions")) {
+  Fill();
+  // The tips follow; whether the button can be used is left to the frame.
+  bar_->Bind(wxEVT_UPDATE_UI, [this](wxUpdateUIEvent& event) {
+    if (IsCommandId(event.GetId())) ShowTip(CommandOfId(event.GetId()));
+    event.Skip();
+  });
+  // Symbols are in the color of texts.
+  shell_.Window().Bind(wxEVT_SYS_COLOUR_CHANGED, [this](wxSysColourChangedEvent& event) {
+    Fill();
+    LogEvent("colors", "changed");
+    event.Skip();
+  });
+}
+
+void FunctionToolbar::Fill() {
+  bar_->ClearTools();
+  std::string names;
+  for (const ToolbarButton& button : ToolbarButtons()) {
+    if (!button.shown) continue;
+    const Command& command = *CommandOfSymbol(button.name);
+    wxString label = wxControl::RemoveMnemonics(command.text);
+    label.EndsWith("...", &label);
+    bar_->AddTool(CommandId(command), label, Symbol(command.symbol, 20), command.help);
+    names += " " + button.name;
+  }
+  bar_->Realize();
+  LogEvent("toolbar", names.empty() ? names : names.substr(1));
+}
+
+void FunctionToolbar::Choose() {
+  if (AskForToolbar(shell_.Window())) Fill();
+}
+
+// The tip of a button that is gray says why.
+void FunctionToolbar::ShowTip(const Command& command) {
+  const wxString key = *command.accelerator == '\0' ? wxString() : wxString(" (") + command.accelerator + ")";
+  const wxString tip = command.help + key + (CanRun(command, shell_) ? wxString() : wxString("\n") + WhyNot(command.needs));
+  if (bar_->GetToolShortHelp(CommandId(command)) != tip) bar_->SetToolShortHelp(CommandId(command), tip);
+}
+
+}  // namespace fotomill::desktop

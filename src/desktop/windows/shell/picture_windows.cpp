@@ -1,0 +1,48 @@
+#include "desktop/windows/shell/picture_windows.h"
+
+#include "desktop/windows/compare/compare_frame.h"
+#include "desktop/windows/shell/browser_tabs.h"
+#include "desktop/windows/shell/shell.h"
+
+namespace fotomill::desktop {
+
+ViewFrame& PictureWindows::View(const std::vector<std::string>& list, const std::string& file) {
+  auto* view = new ViewFrame(shell_, list, file);
+  view->Show();
+  return *view;
+}
+
+void PictureWindows::ViewFromBrowser(const std::string& path) {
+  const BrowserPage* browser = shell_.Tabs().Front();
+  if (browser == nullptr) return;
+  const std::vector<std::string> selected = browser->Model().FilesForFunction();
+  View(selected.size() > 1 ? selected : browser->Model().ShownFiles(), path);
+}
+
+void PictureWindows::ViewBeforeFolder(const std::string& path, std::function<void()> showFolder) {
+  ViewFrame& view = View({path}, path);
+  view.WhenShown([this, showFolder = std::move(showFolder), weak = wxWeakRef<ViewFrame>(&view)] {
+    wantsList_ = weak.get();
+    showFolder();
+    // The new tab has asked for the keyboard; it stays with the picture.
+    shell_.Window().CallAfter([weak] {
+      if (weak == nullptr) return;
+      weak->Raise();
+      weak->Canvas().SetFocus();
+    });
+  });
+}
+
+void PictureWindows::OfferList(const BrowserPage& browser) {
+  if (wantsList_ == nullptr || browser.Listing()) return;
+  if (wantsList_->UseList(browser.Model().ShownFiles())) wantsList_ = nullptr;
+}
+
+void PictureWindows::FilesChanged() {
+  for (wxWindow* window : shell_.Window().GetChildren()) {
+    if (auto* view = dynamic_cast<ViewFrame*>(window)) view->FilesChanged();
+    if (auto* compare = dynamic_cast<CompareFrame*>(window)) compare->FilesChanged();
+  }
+}
+
+}  // namespace fotomill::desktop
