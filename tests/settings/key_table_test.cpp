@@ -2,7 +2,6 @@
 
 #include <gtest/gtest.h>
 
-#include <map>
 #include <string>
 
 #include "core/plain_name.h"
@@ -11,54 +10,6 @@
 
 namespace fotomill {
 namespace {
-
-TEST(KeyTable, TypesAreTheOnesThatPlugInsKnow) {
-  const std::map<std::string, uint32_t> types{
-      {"AllowPluginFormatOverride", 0x1},
-      {"AnnotateText", 0x2},
-      {"LogoDelay", 0x4},
-      {"AlphaBackground", 0xC},
-      {"DefaultViewMode", 0x14},
-      {"JpegCompression", 0x44},
-      {"ApplicationPath", 0x102},
-      {"VersionNumber", 0x104},
-      {"DefaultFileExtension", 0x412},
-      {"DefaultViewZoom", 0x814},
-      {"DropOptions", 0x814},
-      {"LibraryStatusFlags", 0x1002},
-      {"WatchFolders", 0x8001},
-      {"NoThumbnailImage", 0x8002},
-      {"BrowserThumbnailPrecacheDelay", 0x8044},
-      {"PrefixCrop", 0x10002},
-      {"FileTipDelay", 0x1},
-      {"FileHistoryDatabase", 0x2},
-  };
-  for (const auto& [name, type] : types) {
-    SCOPED_TRACE(name);
-    const KeyRow* const row = FindKey(name);
-    ASSERT_NE(row, nullptr);
-    EXPECT_EQ(row->type, type);
-  }
-  EXPECT_EQ(keyTable.count, Keys().size());
-}
-
-TEST(KeyTable, OrderHasItsOddPlaces) {
-  const std::pair<const char*, const char*> neighbours[] = {
-      {"AllowDestinationOverrides", "AllowPluginFormatOverride"},
-      {"AlwaysUseTHN", "AlphaBackground"},
-      {"ControlFontName", "ColourTableFile"},
-      {"LogoDelay", "MattBevelSize"},
-      {"ResourceStatusFlags", "RememberOpenWindows"},
-      {"SequentialRenameUpdate", "ShowDetailListThumbnails"},
-      {"SupercompressorSaveFilePrefix", "SWFPlayOptions"},
-      {"UseFolderOverrides", "UseAlphaChannels"},
-      {"WebPQualityFactor", "ShowWelcomeWizard"},
-      {"WriteJpegProgressive", "WriteOS2Bitmaps"},
-  };
-  for (const auto& [first, second] : neighbours) EXPECT_EQ(FindKey(first) + 1, FindKey(second)) << first;
-  EXPECT_STREQ(Keys().front().name, "AllowDestinationOverrides");
-  EXPECT_STREQ(Keys().back().name, "WriteOS2Bitmaps");
-}
 
 // Each key is reached by its name and its control alone, and its own checks accept its default.
 TEST(KeyTable, RowsAreSound) {
