@@ -3,6 +3,7 @@
 
 #include <filesystem>
 
+#include "batch/abort.h"
 #include "pages/catalogue_page.h"
 #include "settings/settings.h"
 #include "support/bitmaps.h"
@@ -138,6 +139,47 @@ TEST(CataloguePage, SheetsAreTheSameWithAnyNumberOfJobs) {
   }
   ASSERT_EQ(sheets.size(), 6u);
   for (size_t i = 0; i < 3; ++i) EXPECT_TRUE(sheets[i] == sheets[i + 3] && !sheets[i].empty()) << i;
+}
+
+// Aborts once a given file is drawn.
+class AbortingBox : public ProgressBox {
+ public:
+  AbortingBox(const BatchJob& job, std::string last) : job_(job), last_(std::move(last)) {}
+  bool Open(const ProgressModel&) override { return true; }
+  void ShowLine(const ProgressLine&, const FileOutcome*) override {}
+  void ShowStatus(const std::string&) override {}
+  void Tick() override {
+    if (job_.source.view() == last_) Abort();
+  }
+  void StayOpen(const ProgressModel&) override {}
+  void Close(const ProgressModel&) override {}
+
+ private:
+  const BatchJob& job_;
+  const std::string last_;
+};
+
+TEST(CataloguePage, APageThatIsNotFullIsNotWrittenAfterAbort) {
+  const TemporaryFolder folder;
+  std::vector<BatchFile> files;
+  for (int i = 0; i < 5; ++i) {
+    files.push_back({folder.Path("p" + std::to_string(i) + ".bmp"), {}, Status::Ok, {}});
+    WriteBytes(files.back().name, BitmapFile(9, 9, 24));
+  }
+  for (const uint32_t jobs : {1u, 3u}) {
+    SCOPED_TRACE(jobs);
+    const ContactSheetOptions options{.look = {.columns = 3, .rows = 1}, .page = {}, .jobs = jobs};
+    BatchJob job;
+    AbortingBox box(job, files[3].name);
+    job.box = &box;
+    job.formatIndex = FindFormatByName("x.bmp");
+    job.destinationFolder = folder.Path("out" + std::to_string(jobs));
+    ASSERT_EQ(RunContactSheet(files, options, job), Status::Ok);
+    ClearAbort();
+    EXPECT_EQ(job.progress.Files(), 3u);
+    EXPECT_TRUE(std::filesystem::exists(job.destinationFolder + "/Catalog_00001.bmp"));
+    EXPECT_FALSE(std::filesystem::exists(job.destinationFolder + "/Catalog_00002.bmp"));
+  }
 }
 
 }  // namespace

@@ -8,11 +8,13 @@
 #include "formats/png/png.h"
 #include "formats/webp/webp.h"
 #include "platform/files.h"
+#include "settings/settings.h"
 #include "support/bitmaps.h"
 #include "support/codecs.h"
 #include "support/faults.h"
 #include "support/files.h"
 #include "support/hex.h"
+#include "support/scoped_settings.h"
 
 namespace fotomill::test {
 namespace {
@@ -71,6 +73,24 @@ TEST(Turn, FilesChangeOnlyWhereNothingIsLost) {
     for (int32_t x = 0; x < before->image.Width(); ++x) {
       EXPECT_EQ(before->image.PixelAt(x, 1), after->image.PixelAt(after->image.Width() - 2, x));
     }
+  }
+}
+
+TEST(Turn, ACommentThatWouldGoKeepsTheFileAsItIs) {
+  const ScopedSettings scoped;
+  const TemporaryFolder folder;
+  const PicturePointer picture = PatternPicture(9, 5, 24);
+  picture->comment = {'h', 'i'};
+  const std::vector<uint8_t> file = Encode(PngWrite, *picture);
+  const std::string path = folder.Path("a.png");
+  for (const bool kept : {false, true}) {
+    SCOPED_TRACE(kept);
+    settings.PreserveEXIF = kept;
+    WriteBytes(path, file);
+    const TurnedFile turned = TurnPictureFile(path, path, {.turn = Orientation::QuarterRight}, {});
+    EXPECT_EQ(turned.status, kept ? Status::Ok : Status::UnsuitableImage);
+    EXPECT_EQ(turned.hint, kept ? "" : "Its comment would be lost.");
+    EXPECT_EQ(ReadBytes(path) == file, !kept);
   }
 }
 

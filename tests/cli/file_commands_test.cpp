@@ -47,7 +47,10 @@ class FileCommands : public testing::Test {
 };
 
 TEST_F(FileCommands, SelectionKeepsItsOrder) {
+  const TemporaryFolder elsewhere;
+  WriteBytes(elsewhere.Path("e.bmp"), BitmapFile(1, 1, 1));
   fs::create_directory_symlink(folder_.Path(), In("sub/again"));
+  fs::create_directory_symlink(elsewhere.Path(), In("sub/aside"));
   fs::create_symlink(In("a.bmp"), In("link.bmp"));
   fs::create_symlink(In("nowhere.bmp"), In("dangling.bmp"));
   mkfifo(In("pipe.bmp").c_str(), 0600);

@@ -2,6 +2,9 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <string_view>
+
 #include "settings/settings.h"
 #include "support/codecs.h"
 #include "support/files.h"
@@ -64,6 +67,33 @@ TEST(Hdp, DamagedDataNeverEndTheProgram) {
     failures += decoded.status != Status::Ok;
   }
   EXPECT_GT(failures, 0);
+}
+
+TEST(Hdp, ColorsThatWereMultipliedByAlphaAreDividedAgain) {
+  if (!HdpWorksHere()) GTEST_SKIP() << "libjxr is not installed";
+  std::vector<uint8_t> file = ReadBytes(SourcePath("tests/formats/hdp/good/alpha-multiplied.wdp"));
+  const Decoded decoded = Decode(HdpRead, file);
+  ASSERT_EQ(decoded.status, Status::Ok);
+  const std::string_view magic = "WMPHOTO";
+  const auto flags = std::search(file.begin(), file.end(), magic.begin(), magic.end()) + 10;
+  ASSERT_EQ(*flags & 2, 2) << "colors were multiplied by alpha";
+  *flags &= 0xFD;
+  const Decoded plain = Decode(HdpRead, file);
+  ASSERT_EQ(plain.status, Status::Ok);
+  const int32_t alphas[] = {0, 60, 128, 200, 255};
+  for (int32_t y = 0; y < 9; ++y) {
+    for (int32_t x = 0; x < 12; ++x) {
+      const int32_t alpha = decoded.picture->alpha.PixelAt(x, y);
+      ASSERT_EQ(alpha, alphas[(x + y) % 5]);
+      const int32_t colors[] = {x * y * 7 % 256, y * 25, x * 20};  // that the picture was drawn in
+      for (int c = 0; c < 3; ++c) {
+        const int32_t color = alpha == 0 ? 0 : colors[c];
+        const int32_t most = alpha == 0 ? 0 : 255 / alpha + 1;  // what eight bits lose
+        EXPECT_NEAR(decoded.picture->image.PixelAt(x, y) >> 8 * c & 255, color, most) << x << ", " << y;
+        EXPECT_EQ(plain.picture->image.PixelAt(x, y) >> 8 * c & 255, colors[c] * alpha / 255) << x << ", " << y;
+      }
+    }
+  }
 }
 
 TEST(Hdp, DirectoriesThatLeadBackToThemselvesEnd) {

@@ -103,6 +103,54 @@ TEST(Jpeg, FaultsThatArePassedOverAreTold) {
   EXPECT_FALSE(back.picture->warning.empty());
 }
 
+// A file of one block, 8 x 8, in which every component has one value. Huffman codes: 0 for 7 bits that follow, 10 for 8 bits,
+// 110 for the value 128 and, behind each, 0 for nothing more.
+Bytes OneBlock(const char* frame, const Bytes& scans) {
+  Bytes file = Hex("FFD8  FFDB 0043 00");
+  file.insert(file.end(), 64, 8);  // every step is 8, so that a coefficient is the value less 128
+  const Bytes tables = Hex("FFC4 0016 00 010101 00000000000000000000000000 070800"
+                           "FFC4 0014 10 01 000000000000000000000000000000 00");
+  for (const Bytes& part : {tables, Hex(frame), scans, Hex("FFD9")}) file.insert(file.end(), part.begin(), part.end());
+  return file;
+}
+
+TEST(Jpeg, InkIsReadAsItsMarkerSays) {
+  const struct {
+    const char *name, *adobe, *data;
+    int32_t color;
+  } rows[] = {
+      // Cyan 255, magenta 0, yellow and black 128.
+      {"the standard's, 255 is full ink", "", "7F4FECCF", 0x007F3F},
+      {"Adobe's, 255 is no ink", "FFEE 000E 41646F6265 0064 0000 0000 00", "7F4FECCF", 0x800040},
+      {"Adobe's as YCCK, all 128", "FFEE 000E 41646F6265 0064 0000 0000 02", "CCCC", 0x404040},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    const std::string frame = std::string(row.adobe) + "FFC0 0014 08 0008 0008 04 011100 021100 031100 041100";
+    const std::string scan = std::string("FFDA 000E 04 0100 0200 0300 0400 003F00") + row.data;
+    const Decoded decoded = Decode(JpegRead, OneBlock(frame.c_str(), Hex(scan)));
+    ASSERT_EQ(decoded.status, Status::Ok);
+    EXPECT_EQ(decoded.picture->image.PixelAt(0, 0), row.color);
+    EXPECT_EQ(decoded.picture->image.PixelAt(7, 7), row.color);
+  }
+}
+
+// Every scan costs a pass over the picture, though it takes ten bytes.
+TEST(Jpeg, ScansWithoutEndAreRefused) {
+  for (const int count : {1, 400, 600}) {
+    SCOPED_TRACE(count);
+    Bytes scans;
+    for (int i = 0; i < count; ++i) {
+      const Bytes scan = Hex("FFDA 0008 01 0100 000000 DF");
+      scans.insert(scans.end(), scan.begin(), scan.end());
+    }
+    const Bytes file = OneBlock("FFC2 000B 08 0008 0008 01 011100", scans);
+    const Decoded decoded = Decode(JpegRead, file);
+    EXPECT_EQ(decoded.status, count < 600 ? Status::Ok : Status::DamagedFile);
+    EXPECT_EQ(decoded.picture->image.Empty(), count == 600);
+  }
+}
+
 TEST(Jpeg, ThumbnailsDecodeAtTheSmallestSizeThatServes) {
   TemporaryFolder folder;
   WriteBytes(folder.Path("a.jpg"), Encode(JpegWrite, *SmoothPicture(800, 600)));

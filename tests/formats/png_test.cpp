@@ -57,6 +57,28 @@ TEST(Png, BandsBecomeOneStream) {
   }
 }
 
+// The first row of a band differs from the row above, which belongs to the band before.
+TEST(Png, RowsAreFilteredAcrossTheEndsOfBands) {
+  const PicturePointer picture = PatternPicture(1600, 900, 24);  // two bands
+  // Every pixel is half of its left one, so that Average serves best under a row of zeros, which is not there.
+  for (int32_t y = 0; y < 900; ++y) {
+    for (size_t i = 0; i < 4800; ++i) picture->image.Row(y)[i] = static_cast<uint8_t>((128 >> i / 3 % 8) + y % 4);
+  }
+  const std::vector<uint8_t> file = Encode(PngWrite, *picture);
+  const Decoded back = Decode(PngRead, file);
+  ASSERT_EQ(back.status, Status::Ok);
+  EXPECT_TRUE(SamePixels(picture->image, back.picture->image));
+  if (!HasProgram("pngtopnm")) return;
+  const TemporaryFolder folder;
+  WriteBytes(folder.Path("a.png"), file);
+  ASSERT_TRUE(RunShell("pngtopnm " + folder.Path("a.png") + " > " + folder.Path("a.ppm")));
+  const std::vector<uint8_t> seen = ReadBytes(folder.Path("a.ppm"));
+  ASSERT_GT(seen.size(), 900u * 4800);
+  for (size_t y = 0; y < 900; ++y) {  // red first there
+    ASSERT_EQ(seen[seen.size() - (900 - y) * 4800], picture->image.Row(static_cast<int32_t>(y))[2]) << y;
+  }
+}
+
 TEST(Png, AlphaOfPalettePicturesIsKept) {
   const PicturePointer picture = PatternPicture(33, 7, 4);
   ASSERT_EQ(NewAlphaPlane(33, 7, picture->alpha), Status::Ok);

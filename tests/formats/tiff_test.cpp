@@ -2,6 +2,8 @@
 
 #include <gtest/gtest.h>
 
+#include <sstream>
+
 #include "core/choice_lists.h"
 #include "settings/settings.h"
 #include "support/codecs.h"
@@ -74,6 +76,35 @@ TEST(Tiff, SamplesBecomePixels) {
     ASSERT_EQ(decoded.status, Status::Ok);
     EXPECT_EQ(PixelText(decoded.picture->image), row.expected);
     EXPECT_EQ(PixelText(decoded.picture->alpha), row.alpha);
+  }
+}
+
+TEST(Tiff, ColorMapsHoldSixteenBitsOrEight) {
+  constexpr uint16_t kColorMap = 320, kPalette = 3;
+  const std::vector<uint8_t> pixels = Hex("1B");  // 0 1 2 3
+  const struct {
+    const char *name, *map, *expected;  // reds, greens, blues
+  } rows[] = {
+      {"16 bits", "0000 00FF 0080 FFFF  0000 0001 0080 FFFF  0000 00FE 0080 FFFF", "0 0 0  255 1 254  128 128 128  255 255 255"},
+      {"8 bits", "0000 FF00 8000 0C00  0000 0100 8000 2200  0000 FE00 8000 3800", "0 0 0  255 1 254  128 128 128  12 34 56"},
+      {"8 bits but for one", "0000 FF00 8000 0001  0000 0100 8000 0000  0000 FE00 8000 0000", "0 0 0  0 0 0  0 0 0  1 0 0"},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    std::vector<uint8_t> file = Page(4, 1, 2, kPalette, 1, kColorMap, kPageEnd + 1, pixels);
+    file[kPageEnd - 14] = 3;   // shorts
+    file[kPageEnd - 12] = 12;  // so many
+    const std::vector<uint8_t> map = Hex(row.map);
+    file.insert(file.end(), map.begin(), map.end());
+    const Decoded decoded = Decode(TiffRead, file);
+    ASSERT_EQ(decoded.status, Status::Ok);
+    EXPECT_EQ(PixelText(decoded.picture->image), "0 1 2 3");
+    std::istringstream expected(row.expected);
+    for (size_t i = 0; i < 12; ++i) {
+      int level = -1;
+      expected >> level;
+      EXPECT_EQ(decoded.picture->palette[i], level) << i;
+    }
   }
 }
 

@@ -14,10 +14,11 @@ using Words = std::vector<std::string>;
 
 TEST(DesktopEntries, TypesAndCommandLines) {
   constexpr const char* kGlobs =
-      "# made\n50:image/jpeg:*.jpg\n50:image/svg:*.svg\n50:image/svg-gz:*.svg.gz\n60:text/heavy:*.svg\n50:a:read?\n";
+      "# made\n50:image/jpeg:*.jpg\n50:application/gz:*.gz\n50:image/svg:*.svg\n50:image/svg-gz:*.svg.gz\n"
+      "50:text/late:*.gz\n60:text/heavy:*.svg\n50:a:read?\n";
   const struct {
     const char *name, *type;
-  } rows[] = {{"a.JPG", "image/jpeg"}, {"a.svg.gz", "image/svg-gz"}, {"a.svg", "text/heavy"}, {"readm", ""}, {"jpg", ""}};
+  } rows[] = {{"a.JPG", "image/jpeg"}, {"a.svg.gz", "image/svg-gz"}, {"b.gz", "application/gz"}, {"a.svg", "text/heavy"}, {"readm", ""}, {"jpg", ""}};
   for (const auto& row : rows) EXPECT_EQ(MimeTypeIn(kGlobs, row.name), row.type) << row.name;
   EXPECT_EQ(SplitExec("\"/opt/my \\\"app\\\"\" -x  %F"), (Words{"/opt/my \"app\"", "-x", "%F"}));
   EXPECT_FALSE(SplitExec("a \"b").has_value());

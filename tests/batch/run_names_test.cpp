@@ -1,0 +1,57 @@
+#include "batch/run_names.h"
+
+#include <gtest/gtest.h>
+
+#include <utility>
+#include <vector>
+
+#include "support/files.h"
+
+namespace fotomill::test {
+namespace {
+
+// Files whose names depend on what happens to other files of the run have to wait for those.
+TEST(RunNames, OnlyFilesThatNobodyElseConcernsGoAhead) {
+  using Plan = std::vector<std::pair<const char*, const char*>>;  // sources and outputs; the first one is asked about
+  const struct {
+    const char* name;
+    Plan plan;
+    bool alone, overwritten;  // nobody else is concerned; another's output may come to lie on the source
+  } rows[] = {
+      {"names apart", {{"/x/a.bmp", "/out/a.pcx"}, {"/x/b.bmp", "/out/b.pcx"}}, true, false},
+      {"two sources, one output", {{"/x/a.bmp", "/out/a.pcx"}, {"/y/a.bmp", "/out/a.pcx"}}, false, false},
+      {"one name spelled twice", {{"/x/a.bmp", "/out/a.pcx"}, {"/y/a.bmp", "/out/../out/a.pcx"}}, false, false},
+      {"output on another's source", {{"/x/a.bmp", "/x/b.bmp"}, {"/x/b.bmp", "/out/b.pcx"}}, false, false},
+      {"another's output on the source", {{"/x/a.bmp", "/x/c.bmp"}, {"/x/b.bmp", "/x/a.bmp"}}, true, true},
+      {"output on its own source", {{"/x/a.bmp", "/x/a.bmp"}, {"/x/b.bmp", "/x/b.bmp"}}, true, false},
+      {"source named twice", {{"/x/a.bmp", "/x/a.bmp"}, {"/x/a.bmp", "/x/a.bmp"}}, false, true},
+      {"may be another's variant", {{"/x/a [1].bmp", "/out/a [1].pcx"}, {"/x/a.bmp", "/out/a.pcx"}}, false, false},
+      {"variant of nothing", {{"/x/a [1].bmp", "/out/a [1].pcx"}, {"/x/b.bmp", "/out/b.pcx"}}, true, false},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    RunNames names;
+    for (const auto& [source, planned] : row.plan) names.AddSource(source, planned);
+    EXPECT_EQ(names.ConcernsNobodyElse(row.plan[0].first, row.plan[0].second), row.alone);
+    EXPECT_EQ(names.IsOutputOfOthers(row.plan[0].first, row.plan[0].second), row.overwritten);
+  }
+}
+
+TEST(RunNames, AreTakenUntilTheyAreGivenBack) {
+  const TemporaryFolder folder;
+  WriteText(folder.Path("there"), "");
+  RunNames names;
+  names.AddSource("/x/a.bmp", "/out/a.pcx");
+  EXPECT_TRUE(names.TakenByRun("/x/a.bmp", "/x/b.bmp"));
+  EXPECT_FALSE(names.TakenByRun("/x/a.bmp", "/x/a.bmp")) << "its own source";
+  EXPECT_FALSE(names.Taken("/out/a.pcx", "/x/a.bmp"));
+  names.Give("/out/a.pcx");
+  EXPECT_TRUE(names.Taken("/out/b/../a.pcx", "/x/a.bmp"));
+  names.TakeBack("/out/a.pcx");
+  EXPECT_FALSE(names.Taken("/out/a.pcx", "/x/a.bmp"));
+  EXPECT_FALSE(names.TakenByRun(folder.Path("there"), "/x/a.bmp"));
+  EXPECT_TRUE(names.Taken(folder.Path("there"), "/x/a.bmp"));
+}
+
+}  // namespace
+}  // namespace fotomill::test
