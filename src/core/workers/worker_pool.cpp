@@ -15,8 +15,9 @@ constexpr size_t kMostThreads = 256;   // more only cost
 constexpr size_t kMostBlocking = 128;  // of these; so many hanging folders leave room for others
 constexpr Lane kLanes[] = {Lane::Urgent, Lane::Blocking, Lane::Compute};  // in the order in which they are looked at
 
-// The pool one of whose cores this thread keeps busy.
+// The pool one of whose cores this thread keeps busy, and whether for a task of Lane::Urgent.
 thread_local WorkerPool* coreOf = nullptr;
+thread_local bool coreIsUrgent = false;
 
 }  // namespace
 
@@ -85,10 +86,10 @@ bool WorkerPool::TakeTask(Task& task) {
   for (const Lane lane : kLanes) {
     if (!MayBegin(lane)) continue;
     std::deque<std::function<void()>>& waiting = waiting_[static_cast<size_t>(lane)];
-    task = {std::move(waiting.front()), lane != Lane::Blocking};
+    task = {std::move(waiting.front()), lane};
     waiting.pop_front();
     ++running_;
-    if (task.counts) {
+    if (lane != Lane::Blocking) {
       ++busy_;
     } else {
       ++blocking_;
@@ -109,11 +110,13 @@ bool WorkerPool::HelpOut(std::unique_lock<std::mutex>& lock) {
   WakeForCore();
   lock.unlock();
   coreOf = this;
+  coreIsUrgent = false;
   bool more = false;
   (void)Guarded([&] { more = work.step(); });
   coreOf = nullptr;
   lock.lock();
   --busy_;
+  if (returning_ > 0) core_.notify_one();
   --work.running;
   work.exhausted = work.exhausted || !more;
   helped_.notify_all();
@@ -125,14 +128,16 @@ void WorkerPool::Work() {
   for (;;) {
     if (Task task; TakeTask(task)) {
       lock.unlock();
-      coreOf = task.counts ? this : nullptr;
+      coreOf = task.lane != Lane::Blocking ? this : nullptr;
+      coreIsUrgent = task.lane == Lane::Urgent;
       (void)Guarded(task.run);
       task.run = nullptr;  // what it holds goes before the task counts as done
       coreOf = nullptr;
       lock.lock();
       --running_;
-      if (task.counts) {
+      if (task.lane != Lane::Blocking) {
         --busy_;
+        if (returning_ > 0) core_.notify_one();
       } else {
         --blocking_;
       }
@@ -151,17 +156,25 @@ void WorkerPool::Work() {
   }
 }
 
-// Locked, both.
+// Locked.
 void WorkerPool::GiveCore() {
   --busy_;
+  if (returning_ > 0) core_.notify_one();
   WakeForCore();
 }
 
-void WorkerPool::TakeCore() { ++busy_; }
+void WorkerPool::TakeCoreBack(std::unique_lock<std::mutex>& lock, bool urgent) {
+  if (!urgent) {
+    ++returning_;
+    core_.wait(lock, [this] { return busy_ < cores_; });
+    --returning_;
+  }
+  ++busy_;
+}
 
 bool CoreRelease::HoldsCore() { return coreOf != nullptr; }
 
-CoreRelease::CoreRelease() : pool_(std::exchange(coreOf, nullptr)) {
+CoreRelease::CoreRelease() : pool_(std::exchange(coreOf, nullptr)), urgent_(coreIsUrgent) {
   if (pool_ == nullptr) return;
   const std::lock_guard lock(pool_->mutex_);
   pool_->GiveCore();
@@ -169,9 +182,10 @@ CoreRelease::CoreRelease() : pool_(std::exchange(coreOf, nullptr)) {
 
 CoreRelease::~CoreRelease() {
   if (pool_ == nullptr) return;
+  std::unique_lock lock(pool_->mutex_);
+  pool_->TakeCoreBack(lock, urgent_);
   coreOf = pool_;
-  const std::lock_guard lock(pool_->mutex_);
-  pool_->TakeCore();
+  coreIsUrgent = urgent_;
 }
 
 Helpers::Helpers(WorkerPool& pool, unsigned most, std::function<bool()> step) : pool_(pool) {
@@ -179,7 +193,7 @@ Helpers::Helpers(WorkerPool& pool, unsigned most, std::function<bool()> step) : 
   work_.most = most;
   ownCore_ = coreOf != &pool;
   const std::lock_guard lock(pool_.mutex_);
-  if (ownCore_) pool_.TakeCore();
+  if (ownCore_) ++pool_.busy_;
   if (most == 0) return;
   pool_.spare_.push_back(&work_);
   pool_.WakeForCore();  // the one that comes wakes the next

@@ -54,10 +54,10 @@ class WorkerPool {
   };
   struct Task {
     std::function<void()> run;
-    bool counts = false;
+    Lane lane = Lane::Blocking;
   };
 
-  bool HasRoom() const { return busy_ < cores_; }
+  bool HasRoom() const { return busy_ + returning_ < cores_; }
   bool MayBegin(Lane lane) const;
   std::list<SpareWork*>::iterator FindSpare();
   bool TakeTask(Task& task);
@@ -65,7 +65,7 @@ class WorkerPool {
   void WakeOne();
   void WakeForCore();
   void GiveCore();
-  void TakeCore();
+  void TakeCoreBack(std::unique_lock<std::mutex>& lock, bool urgent);
   void Work();
 
   const unsigned cores_;
@@ -73,6 +73,7 @@ class WorkerPool {
   std::mutex mutex_;
   std::condition_variable wake_;    // a thread that waits for work
   std::condition_variable helped_;  // a step of spare work has ended
+  std::condition_variable core_;    // a core has become free that a task wants back
   std::array<std::deque<std::function<void()>>, 3> waiting_;  // by lane
   std::list<SpareWork*> spare_;
   std::vector<std::thread> threads_;
@@ -81,6 +82,7 @@ class WorkerPool {
   size_t running_ = 0;   // tasks
   size_t blocking_ = 0;  // of these, those of Lane::Blocking
   unsigned busy_ = 0;    // cores
+  unsigned returning_ = 0;  // tasks that want their core back
   bool ending_ = false;
 };
 
@@ -101,7 +103,8 @@ class Helpers {
   bool ownCore_ = false;  // the calling thread is no task of the pool, but computes as well
 };
 
-// For its lifetime, the task that makes it waits for something slow: its core is another one's.
+// For its lifetime, the task that makes it waits for something slow: its core is another one's. At the end it waits for a
+// core, before any task that has not begun; one of Lane::Urgent does not wait.
 class CoreRelease {
  public:
   CoreRelease();
@@ -113,6 +116,7 @@ class CoreRelease {
 
  private:
   WorkerPool* pool_;  // null when the thread holds no core
+  bool urgent_ = false;
 };
 
 }  // namespace fotomill
