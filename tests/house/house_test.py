@@ -26,6 +26,7 @@ FLOORS = [
     ["catalog"],
     ["files"],
     ["archive"],
+    ["operations"],
     ["settings"],  # below here, what a job needs of the settings comes in its options
     ["batch"],
     ["pages"],

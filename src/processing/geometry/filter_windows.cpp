@@ -26,6 +26,15 @@ double Cubic(double x) {
 
 double Lanczos(double x) { return std::abs(x) < 3 ? Sinc(x) * Sinc(x / 3) : 0; }
 
+double Box(double x) { return x > -0.5 && x <= 0.5 ? 1 : 0; }
+
+double Mitchell(double x) {
+  x = std::abs(x);
+  if (x < 1) return ((7 * x - 12) * x * x + 16.0 / 3) / 6;
+  if (x < 2) return (((-7.0 / 3 * x + 12) * x - 20) * x + 32.0 / 3) / 6;
+  return 0;
+}
+
 struct FilterShape {
   double (*value)(double);
   double support;  // source pixels on each side, where nothing shrinks
@@ -35,6 +44,8 @@ constexpr FilterShape ShapeOf(ScaleFilter filter) {
   switch (filter) {
     case ScaleFilter::Bilinear: return {Triangle, 1};
     case ScaleFilter::Bicubic: return {Cubic, 2};
+    case ScaleFilter::Box: return {Box, 0.5};
+    case ScaleFilter::Mitchell: return {Mitchell, 2};
     default: return {Lanczos, 3};
   }
 }

@@ -1,4 +1,5 @@
 #include <algorithm>
+#include <array>
 #include <cmath>
 #include <cstring>
 
@@ -22,9 +23,9 @@ struct Blocks {
   int32_t block = 1, count = 0, overhang = 0;
 
   Blocks() = default;
-  Blocks(int32_t sourceCount, int32_t resultCount) {
+  Blocks(int32_t sourceCount, int32_t resultCount, bool wanted) {
     const double scale = static_cast<double>(sourceCount) / resultCount;
-    if (scale >= 2 * kLeftToFilter) block = static_cast<int32_t>(scale / kLeftToFilter);
+    if (wanted && scale >= 2 * kLeftToFilter) block = static_cast<int32_t>(scale / kLeftToFilter);
     count = (sourceCount - 1) / block + 1;
     overhang = static_cast<int32_t>((static_cast<int64_t>(count) * block - sourceCount) / 2);
   }
@@ -42,13 +43,39 @@ bool IsOpaque(const PackedImage& alpha) {
   return true;
 }
 
+// The curve between stored levels and light, both as samples. Source: IEC 61966-2-1, section 5.2.
+struct LightCurve {
+  static constexpr int32_t kMost = 255 << kFraction;
+  std::array<int16_t, 256> light;               // of each level
+  std::array<uint8_t, kMost + 1> level;         // of each amount of light
+  LightCurve() {
+    for (size_t v = 0; v < light.size(); ++v) {
+      const double c = static_cast<double>(v) / 255;
+      const double linear = c <= 0.04045 ? c / 12.92 : std::pow((c + 0.055) / 1.055, 2.4);
+      light[v] = static_cast<int16_t>(std::lround(linear * kMost));
+    }
+    for (size_t l = 0; l < level.size(); ++l) {
+      const double linear = static_cast<double>(l) / kMost;
+      const double c = linear <= 0.0031308 ? linear * 12.92 : 1.055 * std::pow(linear, 1 / 2.4) - 0.055;
+      level[l] = static_cast<uint8_t>(std::lround(c * 255));
+    }
+  }
+  uint8_t LevelOf(float amount) const { return level[static_cast<size_t>(std::clamp(amount + 0.5f, 0.0f, float{kMost}))]; }
+};
+const LightCurve& Light() {
+  static const LightCurve curve;
+  return curve;
+}
+
 // Delivers the rows of a picture as samples, averaged in blocks where it shrinks much. Rows are asked for in order.
 class SampleSource {
  public:
-  // `alpha` may be null.
-  Status Open(const PackedImage& image, const PackedImage* alpha, const Blocks& across, const Blocks& down) {
+  // `alpha` and `light` may be null.
+  Status Open(const PackedImage& image, const PackedImage* alpha, const LightCurve* light, const Blocks& across,
+              const Blocks& down) {
     image_ = &image;
     alpha_ = alpha;
+    light_ = light;
     across_ = across;
     down_ = down;
     channels_ = alpha != nullptr ? 4 : 3;
@@ -79,10 +106,25 @@ class SampleSource {
 
  private:
   void Convert(int32_t y, int16_t* samples) {
-    if (alpha_ != nullptr) {
+    if (light_ != nullptr) {
+      ConvertToLight(y, samples);
+    } else if (alpha_ != nullptr) {
       kernels_.multiply(rows_.Row(y), alpha_->Row(y).data(), static_cast<size_t>(image_->Width()), samples);
     } else {
       kernels_.widen(rows_.Row(y), samples_, samples);
+    }
+  }
+
+  void ConvertToLight(int32_t y, int16_t* samples) {
+    const uint8_t* bgr = rows_.Row(y);
+    if (alpha_ == nullptr) {
+      for (size_t i = 0; i < samples_; ++i) samples[i] = light_->light[bgr[i]];
+      return;
+    }
+    const uint8_t* alpha = alpha_->Row(y).data();
+    for (int32_t x = 0; x < image_->Width(); ++x, bgr += 3, samples += 4) {
+      for (int c = 0; c < 3; ++c) samples[c] = static_cast<int16_t>((light_->light[bgr[c]] * alpha[x] + 127) / 255);
+      samples[3] = static_cast<int16_t>(alpha[x] << kFraction);
     }
   }
 
@@ -102,6 +144,7 @@ class SampleSource {
   const ResampleKernels& kernels_ = ResampleKernelsHere();
   const PackedImage* image_ = nullptr;
   const PackedImage* alpha_ = nullptr;
+  const LightCurve* light_ = nullptr;
   Blocks across_, down_;
   int32_t channels_ = 3;
   size_t samples_ = 0;
@@ -110,43 +153,71 @@ class SampleSource {
 };
 
 // Divides the colors by their alpha again. A pixel that nothing is seen of is black.
-void SplitAlpha(const int16_t* pixels, int32_t width, uint8_t* bgr, uint8_t* alpha) {
+void SplitAlpha(const int16_t* pixels, int32_t width, const LightCurve* light, uint8_t* bgr, uint8_t* alpha) {
   for (int32_t x = 0; x < width; ++x, pixels += 4, bgr += 3) {
     const int32_t level = std::clamp((pixels[3] + (1 << (kFraction - 1))) >> kFraction, 0, 255);
     alpha[x] = static_cast<uint8_t>(level);
     const float scale = level == 0 ? 0 : 255.0f / static_cast<float>(pixels[3]);
     for (int c = 0; c < 3; ++c) {
-      bgr[c] = static_cast<uint8_t>(std::clamp(static_cast<float>(pixels[c]) * scale + 0.5f, 0.0f, 255.0f));
+      const float value = static_cast<float>(pixels[c]) * scale;
+      bgr[c] = light != nullptr ? light->LevelOf(value * (1 << kFraction))
+                                : static_cast<uint8_t>(std::clamp(value + 0.5f, 0.0f, 255.0f));
     }
   }
 }
 
-// One picture on its way to another size, in two passes: down, rows are weighed into one; across, a row is scaled. A
-// picture that gets fewer rows goes down first, so that less is left to scale across; one that gets more goes across
-// first.
+void SplitLight(const int16_t* samples, size_t count, const LightCurve& light, uint8_t* levels) {
+  for (size_t i = 0; i < count; ++i) levels[i] = light.level[static_cast<size_t>(std::clamp<int32_t>(samples[i], 0, LightCurve::kMost))];
+}
+
+// What all bands of one picture on its way to another size share.
+struct ResamplePlan {
+  const PackedImage* image = nullptr;
+  const PackedImage* alpha = nullptr;   // null without one, or where it is opaque
+  const LightCurve* light = nullptr;    // null: levels are averaged as they are
+  Blocks columns, rows;
+  Size size{0, 0};
+  int32_t channels = 3;
+  bool acrossFirst = false;
+  bool direct = false;  // rows of a 24-bit picture can be weighed as they lie
+  size_t samples = 0;   // of a row that is weighed
+  mutable FilterWindows across, down;
+
+  Status Make(const PackedImage& source, const PackedImage* plane, Reach reach, Size target, const ScaleOptions& options) {
+    image = &source;
+    alpha = plane;
+    light = options.linear ? &Light() : nullptr;
+    columns = Blocks(source.Width(), target.width, options.blocks);
+    rows = Blocks(source.Height(), target.height, options.blocks);
+    size = target;
+    channels = plane != nullptr ? 4 : 3;
+    acrossFirst = target.height > rows.count;
+    samples = static_cast<size_t>(acrossFirst ? target.width : columns.count) * static_cast<size_t>(channels);
+    direct = !acrossFirst && source.Bits() == 24 && plane == nullptr && light == nullptr && columns.block == 1 &&
+             rows.block == 1 && samples >= kWeighedAtOnce;
+    RETURN_IF_BAD(across.Make(columns.Edge(reach.width), target.width, options.filter, kMostShortShift));
+    return down.Make(rows.Edge(reach.height), target.height, options.filter, direct ? kMostByteShift : kMostShortShift);
+  }
+};
+
+// A band of rows of the result, in two passes: down, rows are weighed into one; across, a row is scaled. A picture that gets
+// fewer rows goes down first, so that less is left to scale across; one that gets more goes across first.
 class Resampling {
  public:
-  Status Open(const PackedImage& image, const PackedImage* alpha, Reach reach, Size size, ScaleFilter filter) {
-    image_ = &image;
-    const Blocks columns(image.Width(), size.width), rows(image.Height(), size.height);
-    lastRow_ = rows.count - 1;
-    channels_ = alpha != nullptr ? 4 : 3;
-    width_ = size.width;
-    acrossFirst_ = size.height > rows.count;
-    const auto samples = static_cast<size_t>(acrossFirst_ ? size.width : columns.count) * channels_;
-    // Rows of a 24-bit picture can be weighed as they lie.
-    direct_ = !acrossFirst_ && image.Bits() == 24 && alpha == nullptr && columns.block == 1 && rows.block == 1 &&
-              samples >= kWeighedAtOnce;
-    RETURN_IF_BAD(across_.Make(columns.Edge(reach.width), size.width, filter, kMostShortShift));
-    RETURN_IF_BAD(down_.Make(rows.Edge(reach.height), size.height, filter, direct_ ? kMostByteShift : kMostShortShift));
-    if (!direct_) RETURN_IF_BAD(source_.Open(image, alpha, columns, rows));
-    held_ = down_.MostTaps();
-    stride_ = direct_ ? samples : (samples + kSpare + kWeighedAtOnce - 1) / kWeighedAtOnce * kWeighedAtOnce;
-    const uint64_t columnRow = static_cast<uint64_t>(columns.count + kTapGroup) * channels_ + kWeighedAtOnce + kSpare;
-    const uint64_t pixelRow = static_cast<uint64_t>(size.width) * channels_ + kWeighedAtOnce + kSpare;
+  // From row `first` of the result on. The plan must outlive it.
+  Status Open(const ResamplePlan& plan, int32_t first) {
+    plan_ = &plan;
+    lastRow_ = plan.rows.count - 1;
+    filled_ = plan.down.Window(first).first;
+    if (!plan.direct) RETURN_IF_BAD(source_.Open(*plan.image, plan.alpha, plan.light, plan.columns, plan.rows));
+    held_ = plan.down.MostTaps();
+    stride_ = plan.direct ? plan.samples : (plan.samples + kSpare + kWeighedAtOnce - 1) / kWeighedAtOnce * kWeighedAtOnce;
+    const auto channels = static_cast<uint64_t>(plan.channels);
+    const uint64_t columnRow = static_cast<uint64_t>(plan.columns.count + kTapGroup) * channels + kWeighedAtOnce + kSpare;
+    const uint64_t pixelRow = static_cast<uint64_t>(plan.size.width) * channels + kWeighedAtOnce + kSpare;
     const bool room = columns_.Allocate(columnRow * sizeof(int16_t)) && pixels_.Allocate(pixelRow * sizeof(int16_t)) &&
                       pointers_.Allocate(static_cast<uint64_t>(held_) * sizeof(void*)) &&
-                      (direct_ || ring_.Allocate(stride_ * static_cast<uint64_t>(held_) * sizeof(int16_t)));
+                      (plan.direct || ring_.Allocate(stride_ * static_cast<uint64_t>(held_) * sizeof(int16_t)));
     return room ? Status::Ok : Status::MemoryAllocationError;
   }
 
@@ -154,16 +225,19 @@ class Resampling {
   void ScaleRow(int32_t y, std::span<uint8_t> bgr, std::span<uint8_t> alpha) {
     int16_t* columns = columns_.Items<int16_t>().data();
     int16_t* pixels = pixels_.Items<int16_t>().data();
-    if (acrossFirst_) {
+    if (plan_->acrossFirst) {
       Down(y, pixels);
     } else {
       Down(y, columns);
       Across(columns, pixels);
     }
-    if (channels_ == 3) {
-      kernels_.narrow(pixels, 3 * static_cast<size_t>(width_), bgr.data());
+    const size_t samples = 3 * static_cast<size_t>(plan_->size.width);
+    if (plan_->channels == 4) {
+      SplitAlpha(pixels, plan_->size.width, plan_->light, bgr.data(), alpha.data());
+    } else if (plan_->light != nullptr) {
+      SplitLight(pixels, samples, *plan_->light, bgr.data());
     } else {
-      SplitAlpha(pixels, width_, bgr.data(), alpha.data());
+      kernels_.narrow(pixels, samples, bgr.data());
     }
   }
 
@@ -171,25 +245,25 @@ class Resampling {
   static constexpr size_t kSpare = 8;  // samples that a pass may write behind a row's end
 
   void Across(const int16_t* columns, int16_t* pixels) {
-    const auto scale = channels_ == 3 ? kernels_.scaleThree : kernels_.scaleFour;
-    scale(columns, across_.Windows().data(), width_, across_.Shift(), pixels);
+    const auto scale = plan_->channels == 3 ? kernels_.scaleThree : kernels_.scaleFour;
+    scale(columns, plan_->across.Windows().data(), plan_->size.width, plan_->across.Shift(), pixels);
   }
 
   void Down(int32_t y, int16_t* row) {
-    const FilterWindow& window = down_.Window(y);
-    if (direct_) {
-      const auto rows = RowsOf<uint8_t>(window, [&](int32_t r) { return image_->Row(r).data(); });
-      kernels_.weighBytes(rows, window, down_.Shift() - kFraction, stride_, row);
+    const FilterWindow& window = plan_->down.Window(y);
+    if (plan_->direct) {
+      const auto rows = RowsOf<uint8_t>(window, [&](int32_t r) { return plan_->image->Row(r).data(); });
+      kernels_.weighBytes(rows, window, plan_->down.Shift() - kFraction, stride_, row);
       return;
     }
     for (const int32_t end = std::min(window.first + window.taps, lastRow_ + 1); filled_ < end; ++filled_) Fill(filled_);
     const auto rows = RowsOf<int16_t>(window, [&](int32_t r) { return Slot(r); });
-    kernels_.weighShorts(rows, window, down_.Shift(), stride_, row);
+    kernels_.weighShorts(rows, window, plan_->down.Shift(), stride_, row);
   }
 
   int16_t* Slot(int32_t y) { return ring_.Items<int16_t>().data() + static_cast<size_t>(y % held_) * stride_; }
   void Fill(int32_t y) {
-    if (acrossFirst_) {
+    if (plan_->acrossFirst) {
       source_.Read(y, columns_.Items<int16_t>().data());
       Across(columns_.Items<int16_t>().data(), Slot(y));
     } else {
@@ -206,18 +280,31 @@ class Resampling {
   }
 
   const ResampleKernels& kernels_ = ResampleKernelsHere();
-  const PackedImage* image_ = nullptr;
+  const ResamplePlan* plan_ = nullptr;
   SampleSource source_;
-  FilterWindows across_, down_;
-  int32_t lastRow_ = 0, channels_ = 3, width_ = 0;
-  bool acrossFirst_ = false, direct_ = false;
+  int32_t lastRow_ = 0;
   int32_t held_ = 0, filled_ = 0;
-  size_t stride_ = 0;              // samples of a row that is weighed
+  size_t stride_ = 0;              // samples of a row that is weighed, filled up
   platform::MemoryBlock ring_;     // `held_` rows that the windows of rows may need
   platform::MemoryBlock columns_;  // one row as wide as the source, zeros behind its end
   platform::MemoryBlock pixels_;   // one row as wide as the result
   platform::MemoryBlock pointers_;
 };
+
+constexpr int32_t kLeastRows = 32;  // of a band, so that little is computed twice
+
+Status ScaleInBands(const ResamplePlan& plan, const ScaleOptions& options, PackedImage& made, PackedImage& madeAlpha) {
+  ProgressSink* const progress = options.work.threads > 1 ? nullptr : options.progress;
+  return ForBands(plan.size.height, kLeastRows, options.work, [&](int32_t first, int32_t end) {
+    Resampling work;
+    RETURN_IF_BAD(work.Open(plan, first));
+    for (int32_t y = first; y < end; ++y) {
+      work.ScaleRow(y, made.Row(y), plan.alpha != nullptr ? madeAlpha.Row(y) : std::span<uint8_t>());
+      if (progress != nullptr) progress->Step(y + 1, plan.size.height);
+    }
+    return Status::Ok;
+  });
+}
 
 }  // namespace
 
@@ -229,11 +316,16 @@ Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Size si
 
 Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Reach reach, Size size, ScaleFilter filter,
                      PackedImage& scaled, PackedImage& scaledAlpha, ProgressSink* progress) {
+  return ScaleFiltered(image, alpha, reach, size, {.filter = filter, .progress = progress}, scaled, scaledAlpha);
+}
+
+Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Reach reach, Size size, const ScaleOptions& options,
+                     PackedImage& scaled, PackedImage& scaledAlpha) {
   scaled.Free();
   scaledAlpha.Free();
   if (image.Empty()) return Status::DamagedFile;
   PackedImage made, madeAlpha;
-  if (filter == ScaleFilter::Nearest) {
+  if (options.filter == ScaleFilter::Nearest) {
     RETURN_IF_BAD(ScaleNearest(image, size, made));
     if (!alpha.Empty()) RETURN_IF_BAD(ScaleNearest(alpha, size, madeAlpha));
   } else {
@@ -241,12 +333,9 @@ Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Reach r
     if (!alpha.Empty()) RETURN_IF_BAD(NewAlphaPlane(size.width, size.height, madeAlpha));
     const bool blended = !alpha.Empty() && !IsOpaque(alpha);
     if (!alpha.Empty() && !blended) std::memset(madeAlpha.Rows().data(), 255, madeAlpha.Rows().size());
-    Resampling work;
-    RETURN_IF_BAD(work.Open(image, blended ? &alpha : nullptr, reach, size, filter));
-    for (int32_t y = 0; y < size.height; ++y) {
-      work.ScaleRow(y, made.Row(y), blended ? madeAlpha.Row(y) : std::span<uint8_t>());
-      if (progress != nullptr) progress->Step(y + 1, size.height);
-    }
+    ResamplePlan plan;
+    RETURN_IF_BAD(plan.Make(image, blended ? &alpha : nullptr, reach, size, options));
+    RETURN_IF_BAD(ScaleInBands(plan, options, made, madeAlpha));
   }
   scaled = std::move(made);
   scaledAlpha = std::move(madeAlpha);

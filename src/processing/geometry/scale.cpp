@@ -104,12 +104,17 @@ Status ScalePictureByPercentage(PictureRecord& picture, int32_t percentage) {
   return ScalePicture(picture, SizeAtPercentage(picture.image.Width(), picture.image.Height(), percentage), ScaleFilter::Nearest);
 }
 
-Status ScalePicture(PictureRecord& picture, Size size, ScaleFilter filter) {
+Status ScalePicture(PictureRecord& picture, Size size, const ScaleOptions& options) {
   if (picture.image.Empty()) return Status::EmptyImage;
+  const Reach all{static_cast<double>(picture.image.Width()), static_cast<double>(picture.image.Height())};
   PackedImage image, alpha;
-  RETURN_IF_BAD(ScaleFiltered(picture.image, picture.alpha, size, filter, image, alpha, picture.progress));
+  RETURN_IF_BAD(ScaleFiltered(picture.image, picture.alpha, all, size, options, image, alpha));
   Replace(picture, image, alpha);
   return Status::Ok;
+}
+
+Status ScalePicture(PictureRecord& picture, Size size, ScaleFilter filter) {
+  return ScalePicture(picture, size, {.filter = filter, .progress = picture.progress});
 }
 
 }  // namespace fotomill

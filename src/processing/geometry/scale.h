@@ -6,6 +6,7 @@
 #include "core/status.h"
 #include "picture/packed_image.h"
 #include "picture/picture_record.h"
+#include "processing/bands.h"
 
 namespace fotomill {
 
@@ -26,6 +27,8 @@ enum class ScaleFilter {
   Bicubic,   // cubic convolution with a = -1/2 (Keys 1981)
   Bilinear,  // triangle
   Nearest,   // the nearest pixel as it is
+  Box,       // the mean of the pixels that it covers
+  Mitchell,  // cubic with B = C = 1/3 (Mitchell and Netravali 1988): softer than bicubic
 };
 // The filter that a value of the keys ResizeFilter and ThumbnailZoomFilter selects; beyond the list, its nearest entry.
 ScaleFilter ScaleFilterFromKey(int32_t value);
@@ -52,6 +55,20 @@ struct Reach {
 };
 Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Reach reach, Size size, ScaleFilter filter,
                      PackedImage& scaled, PackedImage& scaledAlpha, ProgressSink* progress = nullptr);
+
+// What else decides how a picture is scaled.
+struct ScaleOptions {
+  ScaleFilter filter = ScaleFilter::Bicubic;
+  bool linear = false;    // computes with light instead of sRGB values (IEC 61966-2-1)
+  bool blocks = true;     // large reductions average blocks of pixels first; false: the filter sees every pixel
+  Work work = {};
+  ProgressSink* progress = nullptr;  // told from one thread at a time; with `work.threads` above 1 not at all
+};
+// The same in bands, as the options say. FunctionCancelled (4) when the work was stopped.
+Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Reach reach, Size size, const ScaleOptions& options,
+                     PackedImage& scaled, PackedImage& scaledAlpha);
+// The same for a picture, whose `width`, `height` and `bitsPerPixel` follow. On failure the picture is unchanged.
+Status ScalePicture(PictureRecord& picture, Size size, const ScaleOptions& options);
 
 // The same for a picture, whose `width`, `height` and `bitsPerPixel` follow. On failure the picture is unchanged.
 Status ScalePicture(PictureRecord& picture, Size size, ScaleFilter filter);

@@ -1,0 +1,8 @@
+#include "operations/operations.h"
+
+// Captions and texts.
+namespace fotomill {
+
+std::span<const Operation> AnnotateOperations() { return {}; }
+
+}  // namespace fotomill

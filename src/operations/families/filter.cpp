@@ -1,0 +1,50 @@
+#include "operations/operations.h"
+#include "processing/filters/gaussian.h"
+
+// Filters: what becomes of a pixel depends on its neighbors.
+namespace fotomill {
+
+namespace {
+
+using enum ParameterKind;
+
+constexpr Parameter kSigma = {.name = "sigma", .kind = kNumber, .unit = "px", .preset = "1", .least = 0.1, .most = 1000,
+                              .label = "Sigma", .help = "Standard deviation of the Gaussian."};
+constexpr Parameter kBlur[] = {kSigma};
+constexpr Parameter kUnsharp[] = {
+    kSigma,
+    {.name = "amount", .kind = kNumber, .preset = "1", .least = 0, .most = 10, .label = "Amount",
+     .help = "How much of the difference to the blurred picture is added; 1 is 100 %."},
+    {.name = "threshold", .kind = kNumber, .unit = "levels", .preset = "0", .least = 0, .most = 255, .label = "Threshold",
+     .help = "Smaller differences are left alone."},
+};
+
+GaussianPlace PlaceOf(const OperationContext& context) { return {context.left, context.top}; }
+int32_t Reach(const Arguments& arguments) { return GaussianReach(arguments.Number("sigma")); }
+
+Status Blur(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+  return BlurPicture(picture, arguments.Number("sigma"), PlaceOf(context), context.work);
+}
+Status Sharpen(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+  return UnsharpPicture(picture, arguments.Number("sigma"), 1, 0, PlaceOf(context), context.work);
+}
+Status Unsharp(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+  return UnsharpPicture(picture, arguments.Number("sigma"), arguments.Number("amount"), arguments.Number("threshold"),
+                        PlaceOf(context), context.work);
+}
+
+constexpr Operation kOperations[] = {
+    {.name = "blur", .family = Family::Filter, .label = "Gaussian blur", .help = "Blurs a picture evenly.", .example = "blur 2",
+     .parameters = kBlur, .works = Works::Neighborhood, .apply = Blur, .reach = Reach},
+    {.name = "sharpen", .family = Family::Filter, .label = "Sharpen", .help = "Makes edges stand out.", .example = "sharpen 0.6",
+     .parameters = kBlur, .works = Works::Neighborhood, .apply = Sharpen, .reach = Reach},
+    {.name = "unsharp", .family = Family::Filter, .label = "Unsharp mask",
+     .help = "Sharpens by adding the difference to a blurred copy.", .example = "unsharp 1.5 0.8 threshold=3",
+     .parameters = kUnsharp, .works = Works::Neighborhood, .apply = Unsharp, .reach = Reach},
+};
+
+}  // namespace
+
+std::span<const Operation> FilterOperations() { return kOperations; }
+
+}  // namespace fotomill

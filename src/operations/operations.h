@@ -1,0 +1,27 @@
+#pragma once
+
+#include <span>
+#include <string_view>
+
+#include "operations/operation.h"
+
+namespace fotomill {
+
+// All operations, in the order of families and within them as their files have them.
+std::span<const Operation* const> Operations();
+
+// The operation of that name; null when there is none.
+const Operation* FindOperation(std::string_view name);
+
+// The rows of each family, from its own file in families/.
+std::span<const Operation> CropOperations();
+std::span<const Operation> TransformOperations();
+std::span<const Operation> EffectOperations();
+std::span<const Operation> PaletteOperations();  // of the family effects, the ones that choose new colors
+std::span<const Operation> FilterOperations();
+std::span<const Operation> DistortOperations();  // of the family filter, the ones that bend and scatter
+std::span<const Operation> AnnotateOperations();
+std::span<const Operation> WatermarkOperations();
+std::span<const Operation> MattOperations();
+
+}  // namespace fotomill

@@ -1,0 +1,19 @@
+#pragma once
+
+#include "core/status.h"
+#include "picture/picture_record.h"
+#include "picture/rectangle.h"
+
+namespace fotomill {
+
+// The part of `area` that lies on a picture of that size; width and height 0 when there is none.
+Rectangle Clipped(const Rectangle& area, int32_t width, int32_t height);
+
+// A copy of part of an image, which must lie within it; depth and colors stay. Statuses as NewPackedImage.
+Status CutImage(const PackedImage& image, const Rectangle& area, PackedImage& cut);
+
+// Cuts a picture and its alpha plane down to an area, of which what lies outside is left out. `width` and `height` follow.
+// EmptyImage when nothing of the area lies on the picture; a failure leaves the picture unchanged.
+Status CutPicture(PictureRecord& picture, const Rectangle& area);
+
+}  // namespace fotomill
