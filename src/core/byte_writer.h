@@ -1,5 +1,6 @@
 #pragma once
 
+#include <algorithm>
 #include <cstdint>
 #include <cstring>
 #include <span>
@@ -58,14 +59,13 @@ class ByteWriter {
   uint64_t Position() const { return flushed_ + used_; }
   // These overwrite bytes that lie before Position(): what lies in the file already is changed there, the rest in the buffer.
   void Patch(uint64_t offset, std::span<const uint8_t> bytes) {
-    for (const uint8_t& byte : bytes) {
-      if (offset < flushed_) {
-        failed_ = !file_.WriteAt(offset, {&byte, 1}) || failed_;
-      } else {
-        buffer_.Data()[offset - flushed_] = byte;
-      }
-      ++offset;
+    if (offset < flushed_) {
+      const auto inFile = bytes.first(static_cast<size_t>(std::min<uint64_t>(bytes.size(), flushed_ - offset)));
+      failed_ = !file_.WriteAt(offset, inFile) || failed_;
+      bytes = bytes.subspan(inFile.size());
+      offset = flushed_;
     }
+    if (!bytes.empty()) std::memcpy(buffer_.Data() + (offset - flushed_), bytes.data(), bytes.size());
   }
   void PatchBe32(uint64_t offset, uint32_t value) {
     const uint8_t bytes[] = {static_cast<uint8_t>(value >> 24), static_cast<uint8_t>(value >> 16),
