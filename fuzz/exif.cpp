@@ -85,7 +85,7 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
   (void)DecodeUserComment(block, static_cast<uint32_t>(size), 16, comment);
   GpsLocation location;
   if (ParseGpsLocation({reinterpret_cast<const char*>(data), size}, location)) {
-    (void)GpsDistance(GpsDegrees(location.latitude), GpsDegrees(location.longitude), 0, 0);
+    (void)GpsDistance(GpsDegrees(location.latitude), GpsDegrees(location.longitude), 0, 0, choice::kMiles);
   }
   return 0;
 }

@@ -8,7 +8,9 @@
 #include "catalog/history/file_history.h"
 #include "core/fixed_text.h"
 #include "core/status.h"
+#include "processing/palette/reduce.h"
 #include "registry/registry.h"
+#include "settings/job_options.h"
 
 namespace fotomill {
 
@@ -60,6 +62,7 @@ struct BatchJob {
 
   OverwritePolicy overwrite = OverwritePolicyFromSettings();
   NamingRules naming = NamingRulesFromSettings();
+  ReduceOptions reduction = ReduceOptionsFromSettings();  // of outputs whose format takes fewer colors
   ProgressModel progress;
   uint32_t writeAborts = 0;   // files left out because no numbered variant was free
   std::vector<FileUse> uses;  // for the file history, which belongs to the main thread: UpdateFileHistory(job.uses)

@@ -141,7 +141,7 @@ class Batch {
     const auto deepest = static_cast<int32_t>(FormatRow(job_.formatIndex).maxBits);
     if (picture.bitsPerPixel <= deepest) return Status::Ok;
     if (!function_.reduce) return Status::TooManyColors;
-    return function_.dryRun ? Status::Ok : ReduceColors(picture, deepest);
+    return function_.dryRun ? Status::Ok : ReduceColors(picture, deepest, job_.reduction);
   }
 
   // Settles the name and writes, again when someone else has taken the name since it was found free.
@@ -265,7 +265,7 @@ class Batch {
     for (const int32_t bits : {8, 4, 1}) {
       if (status != Status::TooManyColors || !function_.reduce) break;
       if (picture.bitsPerPixel <= bits) continue;
-      RETURN_IF_BAD(ReduceColors(picture, bits));
+      RETURN_IF_BAD(ReduceColors(picture, bits, job_.reduction));
       status = WritePictureAs(picture, destination.path, job_.formatIndex, write);
     }
     picture.fileName = source;

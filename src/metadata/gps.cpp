@@ -6,7 +6,6 @@
 #include <numbers>
 
 #include "core/text.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -49,17 +48,15 @@ bool ParseGpsLocation(std::string_view text, GpsLocation& location) {
   return true;
 }
 
-bool DefaultGpsLocation(GpsLocation& location) { return ParseGpsLocation(settings.ExifDefaultLocation, location); }
-
 double GpsDegrees(const GpsAngle& angle) {
   const char letter = UpperCase(angle.hemisphere);
   const double sign = letter == 'W' || letter == 'S' ? -1 : 1;
   return sign * (angle.degrees + angle.minutes / 60.0 + angle.seconds / 3600.0);
 }
 
-double GpsDistance(double latitude1, double longitude1, double latitude2, double longitude2) {
+double GpsDistance(double latitude1, double longitude1, double latitude2, double longitude2, choice::DistanceUnit unit) {
   constexpr double kRadians = std::numbers::pi / 180;
-  const double radius = settings.ExifDistinceUnits == 0 ? 3956 : 6367;
+  const double radius = unit == choice::kMiles ? 3956 : 6367;
   const double alongLatitude = std::sin((latitude2 - latitude1) * kRadians / 2);
   const double alongLongitude = std::sin((longitude2 - longitude1) * kRadians / 2);
   const double a = alongLatitude * alongLatitude +
@@ -68,6 +65,6 @@ double GpsDistance(double latitude1, double longitude1, double latitude2, double
   return radius * 2 * std::atan2(std::sqrt(part), std::sqrt(1 - part));
 }
 
-std::string_view GpsDistanceUnit() { return settings.ExifDistinceUnits == 0 ? "miles" : "kilometers"; }
+std::string_view DistanceUnitName(choice::DistanceUnit unit) { return unit == choice::kMiles ? "miles" : "kilometers"; }
 
 }  // namespace fotomill

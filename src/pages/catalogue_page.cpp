@@ -215,7 +215,7 @@ Status WriteCataloguePage(PictureRecord& page, const CataloguePageOptions& optio
     if (!CanWrite(row)) return Status::UnsupportedFunction;
     const auto deepest = static_cast<int32_t>(row.maxBits);
     if (!options.reduce && page.bitsPerPixel > deepest) return Status::TooManyColors;
-    if (!options.dryRun) RETURN_IF_BAD(ReduceColors(page, deepest));
+    if (!options.dryRun) RETURN_IF_BAD(ReduceColors(page, deepest, job.reduction));
     const Status status = WritePage(page, options, destination, job);
     const bool lostRace = status == Status::ErrorCreatingFile && !destination.replace && platform::FileExists(path);
     if (lostRace) continue;  // the next number, then

@@ -14,7 +14,6 @@
 #include "plugins/plugin_bitmap.h"
 #include "plugins/plugin_table.h"
 #include "registry/registry.h"
-#include "settings/key_table.h"
 #include "settings/settings.h"
 
 namespace fotomill {
@@ -26,6 +25,10 @@ std::recursive_mutex& CallMutex() {  // recursive: a module may load pictures th
   static std::recursive_mutex mutex;
   return mutex;
 }
+
+// What modules see of the settings.
+const FMW_CONFIG_ENTRY* configuration = nullptr;
+int32_t configurationCount = 0;
 
 // The picture whose call is running on this thread; the progress entries have no argument that could tell.
 thread_local PictureRecord* currentPicture = nullptr;
@@ -53,13 +56,6 @@ void FMW_CALL HostSetStatus(const char* text) {
   if (ProgressSink* progress = CurrentProgress(); progress != nullptr && text != nullptr) progress->SetText(text);
 }
 
-// The key table as modules see it. Its rows have that very layout.
-const FMW_CONFIG_ENTRY* ConfigurationTable() {
-  static_assert(sizeof(FMW_CONFIG_ENTRY) == sizeof(KeyRow) && offsetof(FMW_CONFIG_ENTRY, type) == offsetof(KeyRow, type) &&
-                offsetof(FMW_CONFIG_ENTRY, extra) == offsetof(KeyRow, extra));
-  return static_cast<const FMW_CONFIG_ENTRY*>(static_cast<const void*>(keyTable.rows));
-}
-
 // One call into a module: holds the mutex, names the picture, and carries the service block.
 class ModuleCall {
  public:
@@ -74,8 +70,8 @@ class ModuleCall {
     services_.progressStep = HostProgressStep;
     services_.progressEnd = HostProgressEnd;
     services_.setStatus = HostSetStatus;
-    services_.configuration = ConfigurationTable();
-    services_.configurationCount = static_cast<int32_t>(keyTable.count);
+    services_.configuration = configuration;
+    services_.configurationCount = configurationCount;
   }
   ~ModuleCall() { currentPicture = before_; }
   ModuleCall(const ModuleCall&) = delete;
@@ -197,6 +193,11 @@ Status PluginComment(PictureRecord& picture, const char* fileName) {
   }
   platform::FreeModuleBlock(handle);
   return block.empty() ? Status::MemoryAllocationError : Status::Ok;
+}
+
+void InstallPluginConfiguration(const FMW_CONFIG_ENTRY* rows, int32_t count) {
+  configuration = rows;
+  configurationCount = count;
 }
 
 int32_t BindPluginFormat(std::string_view fileName) {

@@ -2,6 +2,7 @@
 
 #include "picture/picture_record.h"
 #include "picture/write_options.h"
+#include "plugins/fotomill_plugin.h"
 
 namespace fotomill {
 
@@ -21,6 +22,10 @@ Status PluginWrite(PictureRecord& picture, const WriteOptions& options);
 // Reads the comment inside a file into `picture.comment`. MemoryAllocationError (6) when the returned text cannot be
 // locked; Ok without a comment when the module has none to give.
 Status PluginComment(PictureRecord& picture, const char* fileName);
+
+// The configuration keys that modules may read and change, in the layout that they see; not owned. Without this call modules
+// get none.
+void InstallPluginConfiguration(const FMW_CONFIG_ENTRY* rows, int32_t count);
 
 // Binds the format of a file's extension to the registry's spare row and returns its index, or kNoFormat.
 int32_t BindPluginFormat(std::string_view fileName);

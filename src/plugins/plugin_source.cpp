@@ -6,7 +6,6 @@
 #include "plugins/plugin_bridge.h"
 #include "plugins/plugin_table.h"
 #include "registry/registry.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -46,7 +45,6 @@ void EnablePlugins(const std::string& folder) {
   const std::lock_guard lock(scanMutex);
   scanned = false;
   pluginFolder = folder;
-  TakePluginSwitches();
   InstallPluginSource(&kPluginSource);
 }
 

@@ -5,14 +5,12 @@
 #include <utility>
 #include <vector>
 
-#include "core/ini_file.h"
 #include "core/text.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
 #include "platform/shared_library.h"
 #include "registry/registry.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -28,8 +26,6 @@ std::vector<LoadedEntry>& Table() {
   static std::vector<LoadedEntry> table;
   return table;
 }
-
-constexpr std::string_view kSwitchSection = "Plugins";
 
 // Modules that are switched off.
 std::vector<std::string>& ModulesOff() {
@@ -142,20 +138,11 @@ std::vector<PluginModule> PluginModules(const std::string& folder) {
   return modules;
 }
 
-void TakePluginSwitches() {
-  ModulesOff().clear();
-  IniReader reader(ConfigurationText(), kSwitchSection);
-  for (IniEntry entry; reader.Next(entry);) {
-    if (entry.value == "0") ModulesOff().emplace_back(entry.key);
-  }
-}
+void SetModulesOff(std::vector<std::string> names) { ModulesOff() = std::move(names); }
 
-SaveResult SwitchPluginModule(const std::string& name, bool on) {
+void SwitchModule(const std::string& name, bool on) {
   std::erase(ModulesOff(), name);
   if (!on) ModulesOff().push_back(name);
-  IniEdit edit{name, std::nullopt};
-  if (!on) edit.value = "0";
-  return StoreInSection(kSwitchSection, {&edit, 1});
 }
 
 void UnloadPlugins() { Table().clear(); }
@@ -199,7 +186,6 @@ bool PluginCanHandle(std::string_view fileName) {
 }
 
 bool ConfigurePlugin(int32_t index) {
-  if (index >= 0 && index < PluginFormatCount()) settings.PluginConfigIndex = index;
   if (index < 0 || index >= PluginFormatCount() || PluginRow(index).exports.configure == nullptr) return false;
   FMW_CONFIGURE block = {};
   block.size = sizeof block;

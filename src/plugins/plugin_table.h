@@ -7,7 +7,6 @@
 
 #include "core/fixed_text.h"
 #include "plugins/fotomill_plugin.h"
-#include "settings/configuration.h"
 
 namespace fotomill {
 
@@ -44,17 +43,15 @@ inline constexpr int32_t kFormatsPerModule = 32;
 // Returns the number of formats. A second scan replaces the first.
 int32_t ScanPlugins(const std::string& folder = {});
 // The modules of that folder by file name, loaded or not, and the user's switch of each: one that is off is passed over
-// by the next scan. The configuration file's section "Plugins" holds a line "NAME=0" for each that is off.
+// by the next scan.
 struct PluginModule {
   std::string name;
   bool on = true;
 };
 std::vector<PluginModule> PluginModules(const std::string& folder = {});
-// Takes up the switches of the loaded configuration. Belongs to the main thread, like the configuration; EnablePlugins
-// does it as well.
-void TakePluginSwitches();
-// Switches a module and saves that. What is loaded stays loaded until the next scan.
-SaveResult SwitchPluginModule(const std::string& name, bool on);
+// The modules that are off, by file name; all others are on.
+void SetModulesOff(std::vector<std::string> names);
+void SwitchModule(const std::string& name, bool on);
 // Unloads every module; formats that are bound to a row must not be used afterwards.
 void UnloadPlugins();
 
@@ -74,7 +71,7 @@ bool PluginCanHandle(std::string_view fileName);
 // when a list asks for them, never before. `folder` as for ScanPlugins.
 void EnablePlugins(const std::string& folder = {});
 
-// Calls a row's own settings dialog, and remembers the row in `PluginConfigIndex`. False when the module offers none; the text to show then is kNothingToConfigure.
+// Calls a row's own settings dialog. False when the module offers none; the text to show then is kNothingToConfigure.
 bool ConfigurePlugin(int32_t index);
 inline constexpr std::string_view kNothingToConfigure = "No configuration items are available for the selected plugin.";
 // The help page of a module beneath the program's folder: "html\NAME", with the system's separator.

@@ -77,8 +77,7 @@ TEST_F(Reports, ExifRowsAreTheLinesOfTheText) {
   const std::string path = folder_.Path("a.tif");
   test::WriteBytes(path, test::BigEndianBlock());
   for (const int32_t types : {0, 1}) {
-    settings.ExifShowTypes = types;
-    const ExifReport report = ReadExifReport(path);
+    const ExifReport report = ReadExifReport(path, {.showTypes = types == 1});
     EXPECT_EQ(report.status, Status::Ok);
     std::string text;
     for (const ExifRow& row : report.rows) text += row.heading ? row.name + "\n" : "    " + row.name + "\t" + row.text + "\n";
@@ -87,9 +86,9 @@ TEST_F(Reports, ExifRowsAreTheLinesOfTheText) {
     EXPECT_EQ(text.find(" [SHORT]\t") != std::string::npos, types == 1);
   }
   test::WriteText(folder_.Path("b.tif"), "II, but no more than that");
-  EXPECT_THAT(ReadExifReport(folder_.Path("b.tif")).problem, HasSubstr("damaged"));
-  EXPECT_THAT(ReadExifReport(Sample("c.bmp")).problem, HasSubstr("no EXIF"));
-  EXPECT_EQ(ReadExifReport(folder_.Path("none.jpg")).status, Status::FileOpenError);
+  EXPECT_THAT(ReadExifReport(folder_.Path("b.tif"), {}).problem, HasSubstr("damaged"));
+  EXPECT_THAT(ReadExifReport(Sample("c.bmp"), {}).problem, HasSubstr("no EXIF"));
+  EXPECT_EQ(ReadExifReport(folder_.Path("none.jpg"), {}).status, Status::FileOpenError);
 }
 
 std::string ValueOf(const std::vector<InfoSection>& sections, const std::string& title, const std::string& label) {
@@ -104,17 +103,17 @@ std::string ValueOf(const std::vector<InfoSection>& sections, const std::string&
 TEST_F(Reports, InfoOfOneAndOfSeveral) {
   settings.InfoResolution = 75;
   settings.InfoUnits = choice::kCentimetres;
-  const FileInfo one = ReadFileInfo(Sample("one.bmp"));
+  const FileInfo one = ReadFileInfo(Sample("one.bmp"), InfoOptionsFromSettings());
   EXPECT_EQ(one.status, Status::Ok);
   EXPECT_EQ(ValueOf(one.sections, "General", "Dimensions"), "150 x 112 pixels");
   EXPECT_EQ(ValueOf(one.sections, "General", "Print size"), "5.08 x 3.79 centimeters at 75 dots per inch");
   EXPECT_EQ(ValueOf(one.sections, "Details", "Planes"), "1") << "the blanks in front of the codec's names are gone";
   settings.InfoUnits = choice::kPixels;
-  const FileInfo two = ReadFileInfo(Sample("two.bmp"));
+  const FileInfo two = ReadFileInfo(Sample("two.bmp"), InfoOptionsFromSettings());
   EXPECT_EQ(ValueOf(two.sections, "General", "Print size"), "-");
 
   test::WriteText(folder_.Path("no.png"), "This is no picture.");
-  const FileInfo broken = ReadFileInfo(folder_.Path("no.png"));
+  const FileInfo broken = ReadFileInfo(folder_.Path("no.png"), InfoOptionsFromSettings());
   EXPECT_NE(broken.status, Status::Ok);
   EXPECT_FALSE(broken.problem.empty());
   EXPECT_EQ(ValueOf(broken.sections, "General", "File size"), "19 bytes");

@@ -2,14 +2,14 @@
 
 #include <gtest/gtest.h>
 
-#include "support/scoped_settings.h"
+#include "settings/job_options.h"
 
 namespace fotomill::test {
 namespace {
 
 TEST(Gps, ReadsLocations) {
   GpsLocation location;
-  ASSERT_TRUE(DefaultGpsLocation(location));
+  ASSERT_TRUE(GpsLocationFromSettings(location));
   EXPECT_NEAR(GpsDegrees(location.latitude), 45.33, 1e-9);
   EXPECT_NEAR(GpsDegrees(location.longitude), -79.22, 1e-9);
   ASSERT_TRUE(ParseGpsLocation("33, 51,35.9,s,151,12,40,e", location));
@@ -23,11 +23,9 @@ TEST(Gps, ReadsLocations) {
 }
 
 TEST(Gps, MeasuresDistances) {
-  const ScopedSettings saved;
-  settings.ExifDistinceUnits = 1;
-  EXPECT_NEAR(GpsDistance(60, 179.5, 60, -179.5), 55.56, 0.01) << "across the date line";
-  EXPECT_EQ(GpsDistance(45.33, -79.22, 45.33, -79.22), 0);
-  EXPECT_NEAR(GpsDistance(78.6, -104, -78.6, 76), 20002.5, 0.1) << "opposite places";
+  EXPECT_NEAR(GpsDistance(60, 179.5, 60, -179.5, choice::kKilometres), 55.56, 0.01) << "across the date line";
+  EXPECT_EQ(GpsDistance(45.33, -79.22, 45.33, -79.22, choice::kKilometres), 0);
+  EXPECT_NEAR(GpsDistance(78.6, -104, -78.6, 76, choice::kKilometres), 20002.5, 0.1) << "opposite places";
 }
 
 }  // namespace

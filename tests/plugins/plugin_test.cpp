@@ -8,6 +8,7 @@
 #include "plugins/plugin_table.h"
 #include "registry/registry.h"
 #include "settings/configuration.h"
+#include "settings/plugin_settings.h"
 #include "settings/settings.h"
 #include "support/files.h"
 #include "support/scoped_settings.h"
@@ -19,6 +20,7 @@ std::string OddFolder(const std::string& name) { return std::string(ODD_MODULES)
 
 class Plugins : public testing::Test {
  protected:
+  Plugins() { ApplyPluginSettings(); }
   ~Plugins() override {
     InstallPluginSource(nullptr);
     UnloadPlugins();
@@ -79,6 +81,7 @@ TEST_F(Plugins, AModuleThatIsOffIsPassedOver) {
   for (const char* name : {"FMWPL_a.so", "FMWPL_b.so"}) std::filesystem::copy_file(module, folder_.Path(name));
   EXPECT_EQ(SwitchPluginModule("FMWPL_a.so", false), SaveResult::Done);
   (void)LoadConfiguration();
+  ApplyPluginSettings();
   EnablePlugins(folder_.Path());
   EXPECT_EQ(PluginFormats().size(), 2u);
   EXPECT_EQ(platform::FileNameOf(PluginRow(0).path), "FMWPL_b.so");

@@ -46,7 +46,7 @@ TEST(Reduce, DepthFollowsTheAim) {
     }
   }
   PicturePointer nothing = NewPictureRecord();
-  EXPECT_EQ(ReduceColors(*nothing, 8), Status::EmptyImage);
+  EXPECT_EQ(ReduceColors(*nothing, 8, {}), Status::EmptyImage);
 }
 
 TEST(Reduce, FewColorsAreKeptExactly) {
@@ -55,7 +55,7 @@ TEST(Reduce, FewColorsAreKeptExactly) {
     const PicturePointer picture =
         MakePicture(50, 40, [bits](int32_t x, int32_t y) { return test::Scatter(x, y) % (1u << bits) * 0x050301u; });
     const std::vector<uint32_t> before = Colors(*picture);
-    ASSERT_EQ(ReduceColors(*picture, bits), Status::Ok);
+    ASSERT_EQ(ReduceColors(*picture, bits, {}), Status::Ok);
     EXPECT_EQ(picture->bitsPerPixel, bits);
     EXPECT_EQ(Colors(*picture), before);
   }
@@ -112,7 +112,7 @@ TEST(Reduce, AlphaGoesToTheBackgroundFirst) {
   const PicturePointer picture = MakePicture(20, 20, [](int32_t x, int32_t y) { return test::Scatter(x, y) & 0xffffff; });
   test::AddAlpha(*picture, [](int32_t, int32_t) { return 0; });
   picture->defaultColour = 0x102030;  // blue, green, red
-  ASSERT_EQ(ReduceColors(*picture, 8), Status::Ok);
+  ASSERT_EQ(ReduceColors(*picture, 8, {}), Status::Ok);
   EXPECT_TRUE(picture->alpha.Empty());
   EXPECT_EQ(Colors(*picture), std::vector<uint32_t>(400, 0x302010));
 }
@@ -242,7 +242,7 @@ TEST(Reduce, NoMemoryLeavesThePictureWhole) {
     Status status = Status::MemoryAllocationError;
     for (int64_t failing = 1; status != Status::Ok && failing < 100; ++failing) {
       platform::faultCountdown = failing;
-      status = ReduceColors(*picture, bits);
+      status = ReduceColors(*picture, bits, {});
       platform::faultCountdown = 0;
       if (status == Status::Ok) break;
       EXPECT_EQ(status, Status::MemoryAllocationError);

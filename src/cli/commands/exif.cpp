@@ -15,6 +15,7 @@
 #include "metadata/gps.h"
 #include "platform/files.h"
 #include "platform/output_file.h"
+#include "settings/job_options.h"
 
 namespace fotomill::cli {
 
@@ -113,14 +114,15 @@ class ExifRun {
   }
 
   void ReportDistance(const double (&degrees)[4]) {
-    const double distance = GpsDistance(degrees[0], degrees[1], degrees[2], degrees[3]);
+    const choice::DistanceUnit unit = DistanceUnitFromSettings();
+    const double distance = GpsDistance(degrees[0], degrees[1], degrees[2], degrees[3], unit);
     if (options_.json) {
-      output_.Element({{"distance", distance}, {"unit", GpsDistanceUnit()}});
+      output_.Element({{"distance", distance}, {"unit", DistanceUnitName(unit)}});
       return;
     }
     char text[64];
     std::snprintf(text, sizeof text, "%.3f ", distance);
-    output_.Line(std::string(text).append(GpsDistanceUnit()));
+    output_.Line(std::string(text).append(DistanceUnitName(unit)));
   }
 
   int Finish() { return output_.Finish(); }
@@ -154,7 +156,7 @@ class ExifRun {
   const ExifOptions& options_;
   ResultOutput output_;
   UsedFiles used_{FileFunction::GetInfo};
-  ExifText lines_;
+  ExifText lines_{ExifTextOptionsFromSettings()};
   std::string text_;
 };
 

@@ -7,6 +7,7 @@
 #include "registry/registry.h"
 #include "settings/configuration.h"
 #include "settings/format_switches.h"
+#include "settings/plugin_settings.h"
 
 namespace fotomill::cli {
 
@@ -22,7 +23,10 @@ std::string PrepareFor(const Command& command, const GlobalOptions& global) {
   }
   if (command.needs == Needs::Formats) TakeFormatSwitches();
   if (command.needs == Needs::Formats) RunFormatStartup();
-  if (command.needs == Needs::Formats && !global.noPlugins) EnablePlugins();
+  if (command.needs == Needs::Formats && !global.noPlugins) {
+    ApplyPluginSettings();
+    EnablePlugins();
+  }
   return {};
 }
 

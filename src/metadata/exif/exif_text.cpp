@@ -5,7 +5,6 @@
 #include <string>
 
 #include "core/shown_text.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -50,7 +49,7 @@ void ExifText::Line(const ExifLine& line) {
     escaped = EscapeControls(text);
     text = escaped;
   }
-  const std::string_view label = settings.ExifShowTypes != 0 ? ExifTypeLabel(line.value.type) : std::string_view();
+  const std::string_view label = options_.showTypes ? ExifTypeLabel(line.value.type) : std::string_view();
   constexpr std::string_view kIndent = "    ";
   char* place = Room(kIndent.size() + line.name.size() + (label.empty() ? 0 : 1 + label.size()) + 1 + text.size() + 1);
   if (place == nullptr) return;

@@ -10,7 +10,6 @@
 #include "processing/palette/dither.h"
 #include "processing/palette/fit_palette.h"
 #include "processing/promote.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -238,22 +237,7 @@ Status ReduceToPalette(Reduction& work, NearestColor& nearest) {
   return Status::Ok;
 }
 
-Dither DitherFromKey(int32_t value) { return value == 0 ? Dither::None : value == 1 ? Dither::Ordered : Dither::FloydSteinberg; }
-
 }  // namespace
-
-ReduceOptions ReduceOptionsFromSettings() {
-  ReduceOptions options;
-  options.colorDither = DitherFromKey(settings.FXColorDither);
-  options.monoDither = DitherFromKey(settings.FXMonoDither);
-  options.serpentine = settings.FXBidirectional != 0;
-  options.grays = settings.FXMonomode != 0;
-  options.grayLevels = settings.FXGrayLevel <= 0 ? 0 : std::clamp(settings.FXGrayLevel, 2, 256);
-  options.threshold = std::clamp(settings.FXThreshold, 0, 255);
-  options.brightness = std::clamp(settings.DitherBrightness, -kWhole, kWhole);
-  options.contrast = std::clamp(settings.DitherContrast, -kWhole, kWhole);
-  return options;
-}
 
 Status ReduceColors(PictureRecord& picture, int32_t maxBits, const ReduceOptions& options) {
   if (picture.image.Empty()) return Status::EmptyImage;
@@ -281,10 +265,6 @@ Status ReduceColors(PictureRecord& picture, int32_t maxBits, const ReduceOptions
   picture.palette = work.palette;
   picture.bitsPerPixel = bits;
   return Status::Ok;
-}
-
-Status ReduceColors(PictureRecord& picture, int32_t maxBits) {
-  return ReduceColors(picture, maxBits, ReduceOptionsFromSettings());
 }
 
 }  // namespace fotomill

@@ -4,8 +4,6 @@
 #include "core/shown_text.h"
 #include "metadata/exif/exif_source.h"
 #include "metadata/exif/exif_tags.h"
-#include "metadata/exif/exif_text.h"
-#include "settings/settings.h"
 
 namespace fotomill::desktop {
 
@@ -14,7 +12,8 @@ namespace {
 // Gathers a walk as rows and as the text that the core makes of it.
 class Gather : public ExifSink {
  public:
-  explicit Gather(ExifReport& report) : report_(report) {}
+  Gather(ExifReport& report, const ExifTextOptions& options)
+      : report_(report), types_(options.showTypes), text_(options) {}
 
   void Directory(int32_t number, std::string_view label) override {
     report_.rows.push_back({true, 0, "DIRECTORY " + std::string(label), {}});
@@ -22,7 +21,7 @@ class Gather : public ExifSink {
   }
   void Line(const ExifLine& line) override {
     std::string name(line.name);
-    if (settings.ExifShowTypes != 0) name.append(" ").append(ExifTypeLabel(line.value.type));
+    if (types_) name.append(" ").append(ExifTypeLabel(line.value.type));
     report_.rows.push_back({false, line.value.tag, std::move(name), EscapeControls(line.text)});
     text_.Line(line);
   }
@@ -33,6 +32,7 @@ class Gather : public ExifSink {
 
  private:
   ExifReport& report_;
+  const bool types_;
   ExifText text_;
 };
 
@@ -45,7 +45,7 @@ void TakeThumbnail(std::span<const uint8_t> bytes, ExifReport& report) {
 
 }  // namespace
 
-ExifReport ReadExifReport(const std::string& path) {
+ExifReport ReadExifReport(const std::string& path, const ExifTextOptions& options) {
   ExifReport report;
   ExifSource source;
   report.status = source.Open(path.c_str());
@@ -57,7 +57,7 @@ ExifReport ReadExifReport(const std::string& path) {
     report.problem = "There is no EXIF in this file.";
     return report;
   }
-  Gather gather(report);
+  Gather gather(report, options);
   ExifFindings findings;
   if (!WalkExif(source.Block(), &gather, &findings)) {
     report.status = Status::DamagedFile;

@@ -6,6 +6,7 @@
 
 #include "core/status.h"
 #include "desktop/models/drawing/rgb_image.h"
+#include "metadata/exif/exif_text.h"
 
 namespace fotomill::desktop {
 
@@ -13,7 +14,7 @@ namespace fotomill::desktop {
 struct ExifRow {
   bool heading = false;
   uint16_t tag = 0;
-  std::string name;  // "DIRECTORY EXIF", or the tag's name, with its type when ExifShowTypes asks for that
+  std::string name;  // "DIRECTORY EXIF", or the tag's name, with its type where that is wanted
   std::string text;
 };
 
@@ -28,6 +29,6 @@ struct ExifReport {
 };
 
 // Reads and walks a file's EXIF block. Takes as long as the disk takes; any thread may call it.
-ExifReport ReadExifReport(const std::string& path);
+ExifReport ReadExifReport(const std::string& path, const ExifTextOptions& options);
 
 }  // namespace fotomill::desktop

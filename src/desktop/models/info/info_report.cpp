@@ -14,6 +14,7 @@
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "registry/registry.h"
+#include "settings/job_options.h"
 #include "settings/settings.h"
 
 namespace fotomill::desktop {
@@ -38,14 +39,14 @@ std::string PixelsText(int32_t width, int32_t height) {
 
 std::string BytesText(uint64_t bytes) { return WithThousands(bytes) + (bytes == 1 ? " byte" : " bytes"); }
 
-// How large the picture is on paper at its own resolution, or at InfoResolution when the file has none.
-std::string PrintSize(const PictureRecord& picture) {
+// How large the picture is on paper at its own resolution, or at the assumed one when the file has none.
+std::string PrintSize(const PictureRecord& picture, const InfoOptions& options) {
   const bool own = picture.metadata.dpiX > 0 && picture.metadata.dpiY > 0;
-  const double assumed = std::max(settings.InfoResolution, 1);
+  const double assumed = std::max(options.resolution, 1);
   const double x = own ? picture.metadata.dpiX : assumed, y = own ? picture.metadata.dpiY : assumed;
   const char* const how = own ? "" : " at %g dots per inch";
   std::string text;
-  switch (settings.InfoUnits) {
+  switch (options.units) {
     case choice::kPixels: return {};
     case choice::kCentimetres:
       text = Printed("%.2f x %.2f centimeters", picture.width / x * 2.54, picture.height / y * 2.54);
@@ -55,7 +56,7 @@ std::string PrintSize(const PictureRecord& picture) {
   return own ? text : text + Printed(how, assumed);
 }
 
-void AddFileFacts(const std::string& path, FileInfo& info, InfoSection& general) {
+void AddFileFacts(const std::string& path, const InfoOptions& options, FileInfo& info, InfoSection& general) {
   const platform::FileFacts facts = platform::FactsOf(path);
   general.lines.push_back({"File name", std::string(platform::FileNameOf(path))});
   const platform::PathParts parts = platform::SplitPath(path);
@@ -63,11 +64,11 @@ void AddFileFacts(const std::string& path, FileInfo& info, InfoSection& general)
   if (facts.kind == platform::FileKind::Missing) return;
   info.size = facts.size;
   general.lines.push_back({"File size", BytesText(facts.size)});
-  general.lines.push_back({"Created", HistoryDate(facts.created, settings.FileHistoryDateMode)});
-  general.lines.push_back({"Changed", HistoryDate(facts.modified, settings.FileHistoryDateMode)});
+  general.lines.push_back({"Created", HistoryDate(facts.created, options.dateMode)});
+  general.lines.push_back({"Changed", HistoryDate(facts.modified, options.dateMode)});
 }
 
-void AddPictureFacts(const PictureRecord& picture, FileInfo& info, InfoSection& general) {
+void AddPictureFacts(const PictureRecord& picture, const InfoOptions& options, FileInfo& info, InfoSection& general) {
   const FormatEntry& row = FormatRow(picture.formatIndex);
   info.format = row.description.view();
   info.width = picture.width;
@@ -83,7 +84,7 @@ void AddPictureFacts(const PictureRecord& picture, FileInfo& info, InfoSection& 
   if (picture.metadata.dpiX > 0 && picture.metadata.dpiY > 0) {
     general.lines.push_back({"Resolution", Printed("%g x %g dots per inch", picture.metadata.dpiX, picture.metadata.dpiY)});
   }
-  if (std::string size = PrintSize(picture); !size.empty()) general.lines.push_back({"Print size", std::move(size)});
+  if (std::string size = PrintSize(picture, options); !size.empty()) general.lines.push_back({"Print size", std::move(size)});
   general.lines.push_back({"Image data", BytesText(picture.imageBytes)});
 }
 
@@ -105,8 +106,8 @@ InfoSection DetailsOf(const PictureRecord& picture) {
   return section;
 }
 
-void AddExif(const std::string& path, FileInfo& info) {
-  for (ExifRow& row : ReadExifReport(path).rows) {
+void AddExif(const std::string& path, const InfoOptions& options, FileInfo& info) {
+  for (ExifRow& row : ReadExifReport(path, options.exif).rows) {
     if (row.heading) {
       info.sections.push_back({"EXIF: " + row.name.substr(row.name.find(' ') + 1), {}});
     } else {
@@ -160,22 +161,29 @@ std::vector<Compared> Compare(std::span<const FileInfo> files) {
 
 }  // namespace
 
-FileInfo ReadFileInfo(const std::string& path) {
+InfoOptions InfoOptionsFromSettings() {
+  return {.resolution = settings.InfoResolution,
+          .units = settings.InfoUnits,
+          .dateMode = settings.FileHistoryDateMode,
+          .exif = ExifTextOptionsFromSettings()};
+}
+
+FileInfo ReadFileInfo(const std::string& path, const InfoOptions& options) {
   FileInfo info;
   info.path = path;
   InfoSection general{"General", {}};
-  AddFileFacts(path, info, general);
+  AddFileFacts(path, options, info, general);
   PicturePointer picture;
   info.status = LoadPictureInfo(path.c_str(), picture);
   if (info.status == Status::Ok) {
-    AddPictureFacts(*picture, info, general);
+    AddPictureFacts(*picture, options, info, general);
     const FormatEntry& row = FormatRow(picture->formatIndex);
     if (CanTellDetails(row)) info.status = row.details(*picture);
   }
   if (info.status != Status::Ok) info.problem = ProblemOf(path, info.status);
   info.sections.push_back(std::move(general));
   if (picture != nullptr && picture->detailLines.Count() > 0) info.sections.push_back(DetailsOf(*picture));
-  if (picture != nullptr) AddExif(path, info);
+  if (picture != nullptr) AddExif(path, options, info);
   return info;
 }
 

@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "core/status.h"
+#include "metadata/exif/exif_text.h"
 
 namespace fotomill::desktop {
 
@@ -20,6 +21,15 @@ struct InfoSection {
   std::vector<InfoLine> lines;
 };
 
+// How "Get info" tells it.
+struct InfoOptions {
+  int32_t resolution = 96;  // dots per inch of pictures whose file names none
+  int32_t units = 0;        // choice::LengthUnit of the print size
+  int32_t dateMode = 0;     // choice::DateMode
+  ExifTextOptions exif;
+};
+InfoOptions InfoOptionsFromSettings();
+
 // What "Get info" tells of one file.
 struct FileInfo {
   std::string path;
@@ -32,7 +42,7 @@ struct FileInfo {
 };
 
 // Opens a file's header and gathers its facts; any thread may call it.
-FileInfo ReadFileInfo(const std::string& path);
+FileInfo ReadFileInfo(const std::string& path, const InfoOptions& options);
 
 // What several files have together: totals, what is the same in all of them, and what differs with its values.
 std::vector<InfoSection> SummaryOf(std::span<const FileInfo> files);

@@ -13,7 +13,7 @@
 #include "platform/paths.h"
 #include "plugins/plugin_table.h"
 #include "registry/registry.h"
-#include "settings/configuration.h"
+#include "settings/plugin_settings.h"
 #include "settings/settings.h"
 
 namespace fotomill::desktop {
@@ -121,7 +121,7 @@ void PluginBox::Configure() {
   const int line = list_->GetSelectedRow();
   if (line == wxNOT_FOUND) return;
   const int32_t row = lines_[static_cast<size_t>(line)].row;
-  if (row < 0 || !ConfigurePlugin(row)) wxMessageBox(Shown(kNothingToConfigure), kTitle, wxOK | wxICON_INFORMATION, this);
+  if (row < 0 || !ConfigurePluginRow(row)) wxMessageBox(Shown(kNothingToConfigure), kTitle, wxOK | wxICON_INFORMATION, this);
 }
 
 }  // namespace fotomill::desktop

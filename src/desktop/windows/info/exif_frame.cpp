@@ -18,6 +18,7 @@
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/files.h"
 #include "platform/paths.h"
+#include "settings/job_options.h"
 
 namespace fotomill::desktop {
 
@@ -65,7 +66,9 @@ ExifFrame::ExifFrame(wxWindow* parent, const std::string& path)
   CentreOnParent();
   list_->SetFocus();
   work_.Start(
-      *this, [this](const std::atomic<bool>&) { report_ = ReadExifReport(path_); }, [this] { Finished(); });
+      *this,
+      [this, options = ExifTextOptionsFromSettings()](const std::atomic<bool>&) { report_ = ReadExifReport(path_, options); },
+      [this] { Finished(); });
 }
 
 void ExifFrame::Finished() {

@@ -65,10 +65,10 @@ InfoFrame::InfoFrame(Shell& shell, wxWindow* parent, std::vector<std::string> pa
   timer_.Start(kProgressMs);
   work_.Start(
       *this,
-      [this](const std::atomic<bool>& stop) {
+      [this, options = InfoOptionsFromSettings()](const std::atomic<bool>& stop) {
         for (const std::string& path : paths_) {
           if (stop) return;
-          files_.push_back(ReadFileInfo(path));
+          files_.push_back(ReadFileInfo(path, options));
           ++read_;
         }
         summary_ = SummaryOf(files_);

@@ -25,6 +25,7 @@
 #include "registry/registry.h"
 #include "settings/configuration.h"
 #include "settings/format_switches.h"
+#include "settings/plugin_settings.h"
 
 namespace fotomill::desktop {
 
@@ -73,6 +74,7 @@ class App : public wxApp {
     InstallOverrideBoxes();
     RunFormatStartup();
     formatsStarted_ = true;
+    ApplyPluginSettings();
     EnablePlugins();
     DeleteOldPreviousFiles();
     std::vector<uint8_t> screen = ReadScreenProfile();

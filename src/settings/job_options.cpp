@@ -1,0 +1,41 @@
+#include "settings/job_options.h"
+
+#include <algorithm>
+
+#include "metadata/exif/exif_text.h"
+#include "metadata/gps.h"
+#include "processing/palette/reduce.h"
+#include "settings/settings.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr int32_t kWhole = 100;  // per cent
+constexpr int32_t kFewestGrays = 2, kMostGrays = 256;
+
+Dither DitherFromKey(int32_t value) { return value == 0 ? Dither::None : value == 1 ? Dither::Ordered : Dither::FloydSteinberg; }
+
+}  // namespace
+
+ReduceOptions ReduceOptionsFromSettings() {
+  const int32_t grays = settings.FXGrayLevel;
+  return {.colorDither = DitherFromKey(settings.FXColorDither),
+          .monoDither = DitherFromKey(settings.FXMonoDither),
+          .serpentine = settings.FXBidirectional != 0,
+          .grays = settings.FXMonomode != 0,
+          .grayLevels = grays <= 0 ? 0 : std::clamp(grays, kFewestGrays, kMostGrays),
+          .threshold = std::clamp(settings.FXThreshold, 0, 255),
+          .brightness = std::clamp(settings.DitherBrightness, -kWhole, kWhole),
+          .contrast = std::clamp(settings.DitherContrast, -kWhole, kWhole)};
+}
+
+ExifTextOptions ExifTextOptionsFromSettings() { return {.showTypes = settings.ExifShowTypes != 0}; }
+
+choice::DistanceUnit DistanceUnitFromSettings() {
+  return settings.ExifDistinceUnits == 0 ? choice::kMiles : choice::kKilometres;
+}
+
+bool GpsLocationFromSettings(GpsLocation& location) { return ParseGpsLocation(settings.ExifDefaultLocation, location); }
+
+}  // namespace fotomill

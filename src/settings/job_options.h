@@ -1,0 +1,25 @@
+#pragma once
+
+#include "core/choice_lists.h"
+
+namespace fotomill {
+
+struct ExifTextOptions;
+struct GpsLocation;
+struct ReduceOptions;
+
+// What a job needs of the settings in force, as the small structs that its subjects define. Filled once, where a job begins,
+// on the thread that the settings belong to; the job then runs with its own copy, whatever is changed meanwhile.
+
+// FXColorDither and FXMonoDither (other numbers than those of the lists as the last one), FXBidirectional, FXMonomode,
+// FXGrayLevel, FXThreshold, DitherBrightness and DitherContrast, each clamped to its range.
+ReduceOptions ReduceOptionsFromSettings();
+
+// ExifShowTypes.
+ExifTextOptions ExifTextOptionsFromSettings();
+// ExifDistinceUnits.
+choice::DistanceUnit DistanceUnitFromSettings();
+// ExifDefaultLocation. False, with `location` at zero, when it holds no location.
+[[nodiscard]] bool GpsLocationFromSettings(GpsLocation& location);
+
+}  // namespace fotomill
