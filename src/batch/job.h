@@ -62,6 +62,7 @@ struct BatchJob {
 
   OverwritePolicy overwrite = OverwritePolicyFromSettings();
   NamingRules naming = NamingRulesFromSettings();
+  bool writeComments = WritesCommentsFromSettings();        // into files of plug-in formats
   ReduceOptions reduction = ReduceOptionsFromSettings();  // of outputs whose format takes fewer colors
   ProgressModel progress;
   uint32_t writeAborts = 0;   // files left out because no numbered variant was free

@@ -255,6 +255,7 @@ class Batch {
     WriteOptions write;
     write.existing = destination.replace ? platform::Existing::Replace : platform::Existing::Refuse;
     write.keepMetadata = function_.keepMetadata;
+    write.comment = job_.writeComments;
     write.password = destination.password;
     if (destination.recycle) {
       write.makeWay = [&] { return !platform::FileExists(destination.path) || platform::MoveToTrash(destination.path); };

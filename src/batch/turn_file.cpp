@@ -124,6 +124,7 @@ class Turning {
     RefreshExif(picture);
     WriteOptions plain;
     plain.lossless = true;
+    plain.comment = options_.comment;
     RETURN_IF_BAD(WritePictureAs(picture, working.Path(), picture.formatIndex, plain));
     PicturePointer back;
     RETURN_IF_BAD(LoadPicture(working.Path().c_str(), back));

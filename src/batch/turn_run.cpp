@@ -95,6 +95,7 @@ class TurnBatch {
   void Turn(FileOutcome& outcome) const {
     const std::string folder(platform::SplitPath(outcome.destination).folder);
     WriteOptions options;
+    options.comment = job_.writeComments;
     options.existing = outcome.replaced ? platform::Existing::Replace : platform::Existing::Refuse;
     bool kept = true;
     if (function_.inPlace && function_.keepPrevious) {

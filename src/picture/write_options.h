@@ -14,6 +14,7 @@ struct WriteOptions {
   platform::Existing existing = platform::Existing::Replace;  // what to do about a file of the destination's name
   bool keepMetadata = true;       // EXIF, XMP and ICC of the record go into formats that can hold them
   bool lossless = false;     // without any loss where the format can, whatever the settings say
+  bool comment = false;           // the comment of the record goes into files of plug-in formats
   std::string password;           // for formats that can be protected; empty: none
   std::function<bool()> makeWay;  // called when the new file is whole, before it gets its name; false: it never does
 };

@@ -14,7 +14,6 @@
 #include "plugins/plugin_bitmap.h"
 #include "plugins/plugin_table.h"
 #include "registry/registry.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -110,8 +109,8 @@ Status TakeInfo(const FMW_PICTURE_INFO& info, PictureRecord& picture) {
 }
 
 // Lets the module write the picture to `path`.
-Status CallWriter(const PluginEntry& entry, PictureRecord& picture, const std::string& path) {
-  const std::string comment = settings.WriteFileComments != 0 ? CommentText(picture) : std::string();
+Status CallWriter(const PluginEntry& entry, PictureRecord& picture, const std::string& path, bool withComment) {
+  const std::string comment = withComment ? CommentText(picture) : std::string();
   void* bitmap = NewModuleBitmap(picture.image, picture.alpha);
   if (bitmap == nullptr) return Status::MemoryAllocationError;
   int32_t error = 0;
@@ -171,7 +170,7 @@ Status PluginWrite(PictureRecord& picture, const WriteOptions& options) {
   platform::TemporaryFile working;  // of the same extension: a module may decide by it
   if (!out.Create(destination)) return Status::ErrorCreatingFile;
   if (!working.Create(platform::SplitPath(destination).extension)) return Status::ErrorCreatingFile;
-  RETURN_IF_BAD(CallWriter(*entry, picture, working.Path()));
+  RETURN_IF_BAD(CallWriter(*entry, picture, working.Path(), options.comment));
   platform::FileView written;
   if (!written.Open(working.Path())) return Status::ErrorWritingFile;
   out.Bytes(written.Bytes());

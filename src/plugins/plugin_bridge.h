@@ -16,7 +16,7 @@ Status PluginInfo(PictureRecord& picture, const char* fileName, uint32_t flags);
 // claims, MemoryAllocationError (6) when it cannot be locked or held.
 Status PluginRead(PictureRecord& picture, const char* fileName);
 // Lets the module write a working file beside the destination, which then takes its name. Nothing is left of a failed
-// write. The comment goes along when `WriteFileComments` is on.
+// write. The comment goes along where the options say so.
 Status PluginWrite(PictureRecord& picture, const WriteOptions& options);
 
 // Reads the comment inside a file into `picture.comment`. MemoryAllocationError (6) when the returned text cannot be

@@ -38,4 +38,6 @@ choice::DistanceUnit DistanceUnitFromSettings() {
 
 bool GpsLocationFromSettings(GpsLocation& location) { return ParseGpsLocation(settings.ExifDefaultLocation, location); }
 
+bool WritesCommentsFromSettings() { return settings.WriteFileComments != 0; }
+
 }  // namespace fotomill

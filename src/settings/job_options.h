@@ -22,4 +22,7 @@ choice::DistanceUnit DistanceUnitFromSettings();
 // ExifDefaultLocation. False, with `location` at zero, when it holds no location.
 [[nodiscard]] bool GpsLocationFromSettings(GpsLocation& location);
 
+// WriteFileComments.
+bool WritesCommentsFromSettings();
+
 }  // namespace fotomill

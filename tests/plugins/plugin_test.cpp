@@ -176,10 +176,10 @@ TEST_F(Plugins, OnePluginFormatConvertsToAnother) {
   ASSERT_EQ(LoadPicture(folder_.Path("a.ppm").c_str(), picture), Status::Ok);
   EXPECT_EQ(picture->formatIndex, kSpareRow);
   EXPECT_EQ(std::string(picture->comment.begin(), picture->comment.end()), "kept");
-  settings.WriteFileComments = 1;
-  ASSERT_EQ(WritePicture(*picture, folder_.Path("b.PGM"), {}), Status::Ok);
+  WriteOptions commented;
+  commented.comment = true;
+  ASSERT_EQ(WritePicture(*picture, folder_.Path("b.PGM"), commented), Status::Ok);
   EXPECT_EQ(test::ReadText(folder_.Path("b.PGM")), "P5\n# kept\n2 1\n255\n\x02\xfe");
-  settings.WriteFileComments = 0;
   ASSERT_EQ(WritePicture(*picture, folder_.Path("c.ppm"), {}), Status::Ok);
   EXPECT_EQ(test::ReadText(folder_.Path("c.ppm")), "P6\n2 1\n255\n\x01\x02\x03\xff\xfe\xfd");
 }
