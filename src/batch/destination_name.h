@@ -54,9 +54,12 @@ struct Destination {
   bool noVariant = false;  // skipped because no numbered variant is free
 };
 
+// The "path" of outputs that go to the clipboard, and the hint of a file for which no numbered
+// variant was free.
 inline constexpr std::string_view kClipboardName = "Clipboard";
 inline constexpr std::string_view kWriteAborted = "Unable to create a new file - write aborted.";
 
+// Whether an output is written under its settled name, or its file is left out.
 enum class DestinationAnswer : int32_t { Write = 1, Skip = 2 };
 
 // Settles the name of an output, whose planned path stands in `destination`: asks for it where the settings say so, and what

@@ -24,6 +24,8 @@ struct OverwritePolicy {
   bool previews = true;  // in the prompt
   bool skip = false;     // leave out the file, without a question
 };
+// From PromptBeforeOverwrite, OverwriteKeepBoth and the OverwritePrompt... keys as they are now.
+// `skip` is off: no key sets it.
 OverwritePolicy OverwritePolicyFromSettings();
 
 // How outputs get their names.
@@ -34,13 +36,18 @@ struct NamingRules {
   bool askPassword = false;   // PasswordProtect
   int32_t firstVariant = 1, lastVariant = INT32_MAX;
 };
+// From the keys named above as they are now, ExtensionCaseStyle, and NumberedVariantMin and
+// NumberedVariantMax for the variants.
 NamingRules NamingRulesFromSettings();
 
+// How far a sequential rename has counted.
 struct SequentialRenameState {
   uint32_t number = 1;  // of the next try
   int32_t digits = 4;
   PathText baseName;
 };
+// The start of a new rename: SequentialRenameBaseNumber and SequentialRenameBaseName as they are
+// now.
 SequentialRenameState SequentialRenameFromSettings();
 
 // What one running function carries along: what it was asked for and what came of it. Belongs to the thread that runs the

@@ -19,6 +19,7 @@ struct ProgressItem {
   bool skipped = false;        // the file was left out; no failure
 };
 
+// A line of the list, as it is shown.
 struct ProgressLine {
   std::string text;
   ProgressItem item;
@@ -31,8 +32,10 @@ struct ProgressSettings {
   bool thumbnails = true;
   bool showMissingThumbnails = false;
 };
+// From the progress keys as they are now.
 ProgressSettings ProgressSettingsInForce();
 
+// The box's title, and the window class by which other programs find it.
 inline constexpr const char* kProgressTitle = "Progress";
 inline constexpr const char* kProgressBoxClass = "FotomillProfessionalProgressBox";
 
@@ -51,6 +54,8 @@ class ProgressModel {
   void Finish(bool errors, bool summary, const ProgressSettings& box);
   void Close() { open_ = abortLive_ = closeLive_ = false; }
 
+  // What the box shows: whether it is there, which of its buttons can be pressed, its lines and the
+  // text below them.
   bool IsOpen() const { return open_; }
   bool AbortLive() const { return abortLive_; }
   bool CloseLive() const { return closeLive_; }
@@ -68,6 +73,7 @@ class ProgressModel {
   bool open_ = false, abortLive_ = false, closeLive_ = false, scrollBar_ = false;
 };
 
+// The closing line of a batch in which a file failed.
 inline constexpr std::string_view kErrorsLine = "There were errors";
 // "No files were processed.", "One file was processed." or "7 files were processed."
 std::string CountLine(uint32_t files);
@@ -75,6 +81,7 @@ std::string CountLine(uint32_t files);
 // Place and size of the box in its frame's client area.
 Rectangle ProgressBoxPlace(int32_t frameWidth, int32_t frameHeight, const ProgressSettings& box);
 
+// How the list draws its lines.
 enum class ProgressListKind {
   Plain,         // texts
   FixedRows,     // drawn by the box, rows of one height
@@ -87,6 +94,7 @@ struct ProgressLayout {
   ProgressListKind kind = ProgressListKind::Plain;
   int32_t rowHeight = 0;  // of the list's rows; 0: the list's own, which is read back for drawing
 };
+// Lays out the controls for a client size in pixels.
 ProgressLayout LayOutProgressBox(int32_t clientWidth, int32_t clientHeight, const ProgressSettings& box);
 
 }  // namespace fotomill

@@ -33,6 +33,7 @@ struct OverwriteChecks {
   bool operator==(const OverwriteChecks&) const = default;
 };
 
+// What the overwrite prompt shows.
 struct OverwriteQuestion {
   std::string source;                      // the file that is being worked on
   std::string path;                        // the output, which exists
@@ -42,6 +43,7 @@ struct OverwriteQuestion {
   std::string problem;                     // why the last answer could not be taken, a sentence; empty at first
 };
 
+// What the user decided about one output whose name is taken.
 struct OverwriteAnswer {
   bool ok = false;  // false: this file is skipped and nothing else is looked at
   OverwriteChecks checks;
@@ -49,6 +51,7 @@ struct OverwriteAnswer {
   bool skipRest = false;  // not ok, and so for every collision of this batch
 };
 
+// What the prompt for the name of an output shows.
 struct NameQuestion {
   std::string title;  // what the name is for; may be empty
   std::string source;
@@ -64,6 +67,7 @@ class Prompts {
   virtual ~Prompts() = default;
   // The name of an output; nullopt skips the file.
   virtual std::optional<std::string> AskDestinationName(const NameQuestion& question) = 0;
+  // What is to become of an output whose name is taken.
   virtual OverwriteAnswer AskOverwrite(const OverwriteQuestion& question) = 0;
   // The password that protects an output; nullopt skips the file.
   virtual std::optional<std::string> AskPassword(const std::string& path) = 0;

@@ -19,6 +19,7 @@ namespace fotomill {
 // thread in the order of the selection, to the job's box, and what was written goes into the file history.
 class ReportedRun {
  public:
+  // What is done with each file, and how it is recorded.
   struct Way {
     // On any thread. nullopt for a file that was given up by Abort.
     std::function<std::optional<FileOutcome>(size_t file)> process;

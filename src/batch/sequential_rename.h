@@ -24,13 +24,16 @@ struct SequentialRenameRules {
   bool update = true;  // the next number goes into SequentialRenameBaseNumber
   bool random = false;
 };
+// From the keys as they are now.
 SequentialRenameRules SequentialRenameRulesFromSettings();
 
 // The files that are renamed. In a dry run they only seem to be.
 class RenamedFiles {
  public:
   explicit RenamedFiles(bool dryRun) : dryRun_(dryRun) {}
+  // Whether a path is taken; in a dry run, whether it would be by now.
   bool Exists(const std::string& path) const;
+  // Renames without replacing anything: Taken when the new name is. A dry run only remembers it.
   platform::CommitResult Rename(const std::string& from, const std::string& to);
 
  private:
@@ -49,6 +52,7 @@ Status RenameSequentially(BatchJob& job, std::string& path, const SequentialRena
 // The order of a random run: places 0 to count - 1, the same for the same seed everywhere.
 std::vector<size_t> RandomOrder(size_t count, uint64_t seed);
 
+// How one run goes, beside what the settings say.
 struct RenameOptions {
   std::optional<uint64_t> seed = {};  // of the random order; none: another one each time
   bool dryRun = false;

@@ -8,6 +8,7 @@
 
 namespace fotomill {
 
+// How pictures are to be turned.
 struct TurnRequest {
   Orientation turn = Orientation::Upright;  // of the picture as it is seen
   bool seenByExif = true;                   // it is seen as its EXIF orientation says
@@ -15,6 +16,7 @@ struct TurnRequest {
   bool keepTime = false;                    // the new file has the time of the old one
 };
 
+// What became of one file.
 struct TurnedFile {
   Status status = Status::Ok;
   std::string hint = {};  // to a failure, as a sentence

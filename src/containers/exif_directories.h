@@ -17,6 +17,7 @@ struct ExifEntry {
   uint32_t count = 0;
   std::vector<uint8_t> value;
 };
+// In the order in which they stand in the file.
 using ExifDirectory = std::vector<ExifEntry>;
 
 // The directories of a camera's EXIF, in no file's form. Pointers between them are left out; they are made anew.
@@ -50,6 +51,7 @@ struct PlacedExif {
   std::vector<uint8_t> bytes;
   uint32_t exifOffset = 0, gpsOffset = 0;  // in the file, 0 for none
 };
+// Lays them out for `base`; numbers are turned into the file's byte order.
 PlacedExif PlaceExif(const ExifDirectories& directories, uint32_t base);
 
 // The orientation that the first directory tells, 1 to 8; 1 when it does not.

@@ -10,6 +10,8 @@
 
 namespace fotomill {
 
+// What the APP1 segments of EXIF and XMP begin with, and how much of each fits into one segment
+// behind it.
 inline constexpr std::string_view kExifHead("Exif\0\0", 6);
 inline constexpr std::string_view kXmpHead("http://ns.adobe.com/xap/1.0/\0", 29);
 inline constexpr size_t kMostSegment = 65533;  // data of one segment
@@ -22,6 +24,7 @@ struct JpegSegment {
   std::span<const uint8_t> whole;  // with marker and length
   bool Starts(std::string_view head) const;
 };
+// The segments in the order of the file, up to the first scan.
 struct JpegHead {
   std::vector<JpegSegment> segments;
   size_t scan = 0;  // where the first scan begins

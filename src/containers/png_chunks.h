@@ -18,6 +18,7 @@ struct PngChunk {
 class PngChunks {
  public:
   explicit PngChunks(std::span<const uint8_t> file) : bytes_(file) { valid_ = bytes_.Match("\x89PNG\r\n\x1a\n"); }
+  // Whether the file is a PNG at all.
   bool HasSignature() const { return valid_; }
   // The next chunk; false at the end. CRCs are not checked.
   bool Next(PngChunk& chunk) {

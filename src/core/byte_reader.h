@@ -15,11 +15,14 @@ class ByteReader {
  public:
   explicit ByteReader(std::span<const uint8_t> bytes) : bytes_(bytes) {}
 
+  // Whether no read has run past the end so far; where the next read begins, and what is left of
+  // how many bytes.
   bool Ok() const { return !short_; }
   uint64_t Position() const { return position_; }
   uint64_t Left() const { return bytes_.size() - position_; }
   uint64_t Size() const { return bytes_.size(); }
 
+  // Numbers in the byte order of their name; 0 where not all of their bytes are there.
   uint8_t U8() { return position_ < bytes_.size() ? bytes_[position_++] : static_cast<uint8_t>(Fail()); }
   uint16_t Le16() { return static_cast<uint16_t>(Little(2)); }
   uint32_t Le32() { return static_cast<uint32_t>(Little(4)); }

@@ -10,6 +10,7 @@
 
 namespace fotomill {
 
+// Whether functions marked BYTE_SHUFFLE may be called on this processor.
 inline bool CanShuffleBytes() {
   static const bool can = __builtin_cpu_supports("ssse3") && __builtin_cpu_supports("popcnt");
   return can;

@@ -23,6 +23,8 @@ class ByteWriter {
     return buffer_.Allocate(kBufferSize, platform::Fill::Unset) && file_.Create(path);
   }
 
+  // These append at Position(), numbers in the byte order of their name, a text without a closing
+  // zero.
   void U8(uint8_t value) { *Room(1) = value; }
   void Le16(uint16_t value) { Little(value, 2); }
   void Le32(uint32_t value) { Little(value, 4); }
@@ -77,6 +79,7 @@ class ByteWriter {
                              static_cast<uint8_t>(value >> 24)};
     Patch(offset, bytes);
   }
+  // Whether any write to the system has failed; what is written after that goes nowhere.
   bool Failed() const { return failed_; }
 
   // Writes what is left; nothing can be added then. False when any write has failed.

@@ -27,8 +27,11 @@ class FixedText {
     std::copy(text.begin(), text.end(), characters_.begin());
     std::fill(characters_.begin() + static_cast<std::ptrdiff_t>(text.size()), characters_.end(), '\0');
   }
+  // Makes it empty and its bytes all zero, as records on disk have them.
   constexpr void Clear() { characters_.fill('\0'); }
 
+  // The text up to its zero byte. Who writes through `data` keeps within Capacity() and the zero
+  // behind it.
   constexpr std::string_view view() const { return {characters_.data(), Length()}; }
   constexpr const char* c_str() const { return characters_.data(); }
   constexpr char* data() { return characters_.data(); }

@@ -9,6 +9,7 @@ namespace fotomill {
 class ProgressSink {
  public:
   virtual ~ProgressSink() = default;
+  // Begin and End enclose the steps of one operation; operations within it enclose theirs.
   virtual void Begin() {}
   // `done` of `total` steps, usually rows, are finished.
   virtual void Step(int32_t done, int32_t total) = 0;

@@ -12,6 +12,7 @@ enum class [[nodiscard]] Status : int32_t{
 #undef STATUS
 };
 
+// The number that JSON, plug-ins and the manual know a status by.
 constexpr int32_t StatusNumber(Status status) { return static_cast<int32_t>(status); }
 
 // The user message of a status, "Ok" for success; numbers outside the table (a plug-in may return any) give an empty text.

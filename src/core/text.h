@@ -13,6 +13,7 @@ constexpr bool IsLetter(char c) { return LowerCase(c) >= 'a' && LowerCase(c) <= 
 std::string LowerCase(std::string_view text);
 std::string UpperCase(std::string_view text);
 
+// Compares with the case of A to Z ignored; other letters and bytes have to be the same.
 constexpr bool EqualIgnoringCase(std::string_view a, std::string_view b) {
   if (a.size() != b.size()) return false;
   for (size_t i = 0; i < a.size(); ++i) {

@@ -10,6 +10,7 @@
 
 namespace fotomill {
 
+// How the picture is to be turned.
 struct JpegTurnWish {
   Orientation turn = Orientation::Upright;  // of the picture as it is seen
   bool seenByExif = true;                   // it is seen as its EXIF orientation says; otherwise as its pixels are stored

@@ -12,6 +12,7 @@ struct GpsAngle {
   double seconds = 0;
   char hemisphere = '\0';
 };
+// A place on the earth; both angles are zero and without hemisphere when nothing is known.
 struct GpsLocation {
   GpsAngle latitude, longitude;
 };

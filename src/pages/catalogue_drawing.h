@@ -11,6 +11,7 @@
 
 namespace fotomill {
 
+// What surrounds a cell: nothing, a border lit from the top left, or a line.
 enum class CellFrame { None, Raised, Flat };
 
 // How catalogue pages look. Color values are 0x00BBGGRR.
@@ -27,6 +28,7 @@ struct CatalogueLook {
 // One cell takes this more than its picture's room.
 inline constexpr int32_t kCellExtraWidth = 12, kCellExtraHeight = 21;
 
+// The whole page in pixels, at 0, 0.
 Rectangle PageSize(const CatalogueLook& look);
 // The corner of cell `index`, counted row by row, and its picture's room.
 Rectangle CellPlace(const CatalogueLook& look, int32_t index);
@@ -42,6 +44,7 @@ Status NewCataloguePage(const CatalogueLook& look, PackedImage& page);
 void DrawCell(const CatalogueLook& look, int32_t index, const PackedImage& image, std::string_view name, CaptionFont* font,
               PackedImage& page);
 
+// Pixels from line to line of the names' font.
 inline constexpr int32_t kCaptionHeight = 14;
 
 }  // namespace fotomill

@@ -16,6 +16,7 @@ inline constexpr uint32_t kLastCataloguePage = 10000000;
 // "Catalog_00001.jpg": the prefix, the number with at least five digits, the extension in lower case.
 std::string CataloguePageName(std::string_view prefix, uint32_t number, std::string_view extension);
 
+// How a page is written.
 struct CataloguePageOptions {
   bool reduce = false;  // the page's colors are reduced where the format takes fewer
   bool dryRun = false;
@@ -26,6 +27,7 @@ struct CataloguePageOptions {
 // else the writer's own status. A page that was written sets the job's files-changed flag and goes to job.uses.
 Status WriteCataloguePage(PictureRecord& page, const CataloguePageOptions& options, BatchJob& job, std::string& path);
 
+// How a selection is drawn.
 struct ContactSheetOptions {
   CatalogueLook look;
   CataloguePageOptions page;

@@ -9,6 +9,7 @@ namespace fotomill::platform {
 // allocation of this folder asks FaultDue() first and fails when it answers true.
 extern std::atomic<int64_t> faultCountdown;  // operations until the fault; 0 or less: none is planned
 
+// Counts one operation. True for the one that is to fail, and only for that.
 inline bool FaultDue() {
   if (faultCountdown.load(std::memory_order_relaxed) <= 0) return false;
   return faultCountdown.fetch_sub(1, std::memory_order_relaxed) == 1;

@@ -27,6 +27,8 @@ class FileView {
   [[nodiscard]] bool OpenHead(const char* path, uint64_t count);
   void Close();
 
+  // What is visible, until Close or another Open; and the length of the whole file when it was
+  // opened.
   std::span<const uint8_t> Bytes() const { return {data_, static_cast<size_t>(size_)}; }
   uint64_t FileSize() const { return fileSize_; }
   // Copies the bytes of the file from `offset` on into `into`, also those that OpenHead left out, without making them a

@@ -35,6 +35,7 @@ struct FolderEntry {
   FileKind kind;  // of a link: what it leads to, Other when that is nothing
   bool link;      // the entry is a symbolic link; who walks down folders does not follow these
 };
+// Reads the whole folder; links are followed once to tell their kind.
 std::optional<std::vector<FolderEntry>> ListFolder(const std::string& path);
 // Makes a folder with its parents; true when it is there afterwards.
 [[nodiscard]] bool MakeFolders(const std::string& path);
@@ -66,6 +67,8 @@ struct ExactTime {
   int64_t seconds = 0;
   int64_t nanoseconds = 0;
 };
+// Of the file that a path leads to, through links. nullopt and false when it is not there or not
+// ours to change.
 std::optional<ExactTime> ModificationTime(const std::string& path);
 [[nodiscard]] bool SetModificationTime(const std::string& path, ExactTime time);
 // Gives a file the modification time of another, as finely as the system keeps it.

@@ -11,6 +11,7 @@ namespace fotomill::platform {
 class LaterStart {
  public:
   virtual ~LaterStart() = default;
+  // What the later start was given, byte for byte.
   virtual const std::string& Message() const = 0;
   // Lets the later start end. False when it has given up waiting: it goes on by itself, and its message is to be dropped.
   virtual bool Take() = 0;
@@ -20,6 +21,7 @@ class LaterStart {
 // an earlier program left behind when it was killed, one that hangs, and files of other users never stand in the way.
 class FirstStart {
  public:
+  // Which of the programs of a name this one is.
   enum class Standing {
     First,       // the only one so far
     HandedOver,  // another one has taken the message

@@ -14,6 +14,7 @@ enum class SpecialFolder {
   Documents,  // likewise
   Temporary,  // $TMPDIR where it is a folder, else /tmp
 };
+// Asks the environment and the system each time; the folder need not be there.
 std::string SpecialFolderPath(SpecialFolder folder);
 // Where fonts are kept, the user's own first; the folders may have folders in them, and need not be there.
 std::vector<std::string> FontFolders();

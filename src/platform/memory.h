@@ -31,6 +31,8 @@ class MemoryBlock {
   [[nodiscard]] bool Resize(uint64_t size);
   void Free();
 
+  // The block as it is: null and of size 0 when nothing is allocated. Pointers and spans hold until
+  // Allocate, Resize or Free.
   bool Empty() const { return data_ == nullptr; }
   uint64_t Size() const { return size_; }
   uint8_t* Data() { return data_; }

@@ -12,6 +12,7 @@ enum class Existing {
   Refuse,   // fail, and leave it alone
 };
 
+// What became of giving a file its name.
 enum class CommitResult {
   Done,
   Taken,   // Existing::Refuse, and the name was taken meanwhile

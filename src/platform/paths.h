@@ -13,6 +13,8 @@ struct PathParts {
   std::string_view extension;  // with its dot, or empty; the last dot of the name decides
 };
 
+// Splits at the last separator and the last dot behind it, and puts parts together again. Nothing
+// is asked of the system.
 PathParts SplitPath(std::string_view path);
 std::string JoinPath(const PathParts& parts);
 // `folder` and `name` with one separator between them; an empty folder gives the name alone.

@@ -22,6 +22,7 @@ class ReservedMemory {
   [[nodiscard]] bool Reserve(uint64_t size);
   void Free();
 
+  // Whether nothing is reserved, and how many bytes are.
   bool Empty() const { return data_ == nullptr; }
   uint64_t Size() const { return size_; }
   // `count` plain structures from a byte offset on, which the caller keeps inside the room.

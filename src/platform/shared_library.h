@@ -23,6 +23,7 @@ class SharedLibrary {
   Function* FunctionNamed(const char* name) const {
     return reinterpret_cast<Function*>(Symbol(name));
   }
+  // The system's handle, null without a module, and the system's words on why the last Load failed.
   void* Handle() const { return handle_; }
   const std::string& Error() const { return error_; }
   void Unload();

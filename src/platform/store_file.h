@@ -15,6 +15,7 @@ class StoreFile {
   ~StoreFile() { Close(); }
 
   enum class Mode { Read, ReadWrite, CreateNew };  // CreateNew fails when the name is taken
+  // Exists: the name that CreateNew wanted is taken.
   enum class OpenResult { Done, Missing, Exists, Failed };
   // Opens a regular file; links are followed for reading only. A link that leads nowhere is Failed, not Missing: who makes
   // a new store where one merely could not be opened loses the old one.
@@ -22,6 +23,7 @@ class StoreFile {
   void Close();
   bool IsOpen() const { return handle_ != -1; }
 
+  // Bytes that the file has now, whoever wrote them; 0 when it cannot be asked.
   uint64_t Size() const;
   int64_t Modified() const;  // nanoseconds since 1970, as precise as the system keeps it
   // All or nothing: false when fewer bytes were read or written.
@@ -54,6 +56,7 @@ class StoreLock {
   }
   StoreLock(const StoreLock&) = delete;
   StoreLock& operator=(const StoreLock&) = delete;
+  // False when the lock could not be had: the file must not be changed then.
   bool Held() const { return held_; }
 
  private:

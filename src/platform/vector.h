@@ -20,6 +20,7 @@
 
 namespace fotomill::platform {
 
+// Whether this processor and its system have AVX2.
 inline bool HasAvx2() {
 #if VECTOR_HAS_AVX2
   static const bool has = __builtin_cpu_supports("avx2");

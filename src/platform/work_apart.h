@@ -24,6 +24,7 @@ class SharedBlock {
   uint64_t size_ = 0;
 };
 
+// How work apart ended.
 enum class ApartResult {
   Done,        // the work answered true
   Failed,      // it answered false

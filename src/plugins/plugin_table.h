@@ -55,6 +55,7 @@ void SwitchModule(const std::string& name, bool on);
 // Unloads every module; formats that are bound to a row must not be used afterwards.
 void UnloadPlugins();
 
+// Rows of the table, 0 before a scan.
 int32_t PluginFormatCount();
 // Row `index` of the table, from 0; it lives until the next scan.
 const PluginEntry& PluginRow(int32_t index);

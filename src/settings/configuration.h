@@ -17,12 +17,14 @@ namespace fotomill {
 // for each key that differs from its default. Numbers, flags, colors and choices are decimal, texts stand as they are.
 // All of this belongs to the main thread.
 
+// The file's name in the data folder, and the section that holds the keys.
 inline constexpr std::string_view kConfigurationFile = "Fotomill Professional 11.ini";
 inline constexpr std::string_view kConfigurationSection = "Fotomill";
 
 // Path of the configuration file, whether it is there or not; empty without a data folder.
 std::string ConfigurationPath();
 
+// What became of loading the configuration file.
 enum class ConfigurationState {
   NotLoaded,
   Missing,  // the defaults stand
@@ -50,12 +52,14 @@ struct SetResult {
   enum Code { Done, UnknownKey, WrongValue } code = Done;
   std::string message;  // for people, a whole sentence; names the nearest key when there is none of that name
 
+  // Whether there was nothing to complain of.
   bool Ok() const { return code == Done; }
 };
 
 // Gives a key a value for this run: it wins over the configuration file and is not written there by a later save.
 SetResult SetSetting(std::string_view key, std::string_view value);
 
+// What became of writing to the configuration file.
 enum class SaveResult {
   Done,
   Unchanged,   // there was nothing to write
@@ -86,6 +90,7 @@ void KeepSetting(const KeyRow& row);
 struct EarlySettings {
   int32_t showStartupWindow, logoDelay, normalTextFontSize, smallTextFontSize, normalThumbFontSize;
 };
+// Defaults where the file cannot be read or does not name a key. Changes no setting.
 EarlySettings ReadEarlySettings();
 
 // The configuration file as one block for showing it or passing it on: a comment header, then the file's bytes. nullopt when

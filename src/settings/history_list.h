@@ -13,6 +13,7 @@ namespace fotomill {
 // The entry, and the value of several text keys, that stands for the built-in choice.
 inline constexpr std::string_view kDefaultEntry = "~~~DEFAULT~~~";
 
+// Each list with its file, the key that tells its length, and what it is of.
 enum class HistoryList {
   MoveCopy,       // "FMWMoveCopyHistory.txt", CopyHistoryMax: folders that files were moved or copied to
   Destination,    // "FMWDestinationHistory.txt", DestHistoryMax: folders that functions wrote to
@@ -38,6 +39,8 @@ struct RecentFile {
 
   bool operator==(const RecentFile&) const = default;
 };
+// The entries that may be offered, the latest first. Empty when there are none or the file cannot
+// be read.
 std::vector<RecentFile> LoadRecentFiles();
 // As for the lists above; the path decides what is the same entry.
 [[nodiscard]] bool AddRecentFile(const RecentFile& file);

@@ -53,6 +53,7 @@ enum class KeyNumber : uint32_t {
 #undef SETTING
   Count
 };
+// How many keys there are.
 inline constexpr size_t kKeyCount = static_cast<size_t>(KeyNumber::Count);
 
 // All keys in table order, with their count right behind the rows.
@@ -60,6 +61,7 @@ struct KeyTable {
   KeyRow rows[kKeyCount];
   uint32_t count;
 };
+// Laid out for plug-ins; the program itself goes through the functions below.
 extern const KeyTable keyTable;
 
 inline std::span<const KeyRow> Keys() { return keyTable.rows; }

@@ -19,6 +19,7 @@ struct CarryOver {
 // decide; it makes the new folder when there is something to copy.
 CarryOver CarryOverDataFolder(const std::string& previous, const std::string& current);
 
+// What CarryOverDataFolder looks for in the old folder, the patterns divided by semicolons.
 inline constexpr std::string_view kPreviousConfigurationFile = "Fotomill Professional 10.ini";
 inline constexpr std::string_view kCarriedFiles = "*.browser;*.txt;Fotomill.tdb;FMWFileHistoryDatabase.fhdb;*.ccl;*.list";
 

@@ -25,6 +25,7 @@ enum class ValueFault {
 // Where a value comes from. A person is told of every fault. A file is not: what can be used of it is.
 enum class ValueSource { Person, File };
 
+// A value that was read, and what is wrong with it.
 struct SettingValue {
   ValueFault fault = ValueFault::None;
   bool usable = true;     // false: the key keeps the value that it has

@@ -17,6 +17,7 @@ namespace fotomill {
 class SetupDialog {
  public:
   virtual ~SetupDialog() = default;
+  // Whether the dialog has that control. The rest is asked of those that it has only.
   virtual bool Has(uint32_t control) const = 0;
 
   virtual void SetChecked(uint32_t control, bool checked) = 0;
@@ -38,9 +39,11 @@ class SetupDialog {
 class DestinationSource {
  public:
   virtual ~DestinationSource() = default;
+  // Lower case, without dot.
   virtual std::vector<std::string> Extensions() const = 0;
 };
 
+// Which values controls are filled with.
 enum class SetupValues { InForce, Default };
 
 // Fills every control of the dialog that edits a key with the key's value, its limit, range or choices. With the defaults

@@ -39,6 +39,7 @@ enum class FileFunction : int32_t {
   FindSimilar,
   Catalog,
 };
+// How many functions there are, and the number of none.
 inline constexpr int32_t kFileFunctionCount = 20;
 inline constexpr int32_t kNoFileFunction = -1;
 
@@ -78,6 +79,7 @@ struct FileHistoryEntry {
   int32_t created = 0, accessed = 0;  // seconds since 1970 UTC
   uint64_t size = 0;                  // bytes
 };
+// How many entries the list has; 0 while it is not loaded.
 size_t FileHistoryCount();
 FileHistoryEntry FileHistoryAt(size_t index);  // from 0, the last use first
 // The thumbnail of an entry, read from its file's thumbnail file when it is first asked for; null when there is none. It
@@ -93,6 +95,7 @@ struct FileUse {
   bool removed = false;  // the path is gone: its entry is taken out instead
 };
 
+// What became of the uses that a command recorded.
 enum class HistoryUpdate {
   Done,     // loaded, recorded and saved
   Off,      // switched off: nothing was recorded

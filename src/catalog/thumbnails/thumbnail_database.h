@@ -39,12 +39,14 @@ inline constexpr std::string_view kDatabaseMagic = "BRNTTDBX";
 inline constexpr uint32_t kDatabaseVersion = 0x01600100;
 inline constexpr std::string_view kDatabaseName = "Fotomill.tdb";
 
+// The header, without its magic.
 struct DatabaseHeader {
   uint32_t version = kDatabaseVersion;
   int32_t count = 0;
   uint32_t created = 0, appended = 0;  // seconds since 1970 UTC
 };
 
+// A record as it is read or appended.
 struct DatabaseRecord {
   ThumbnailRecord thumbnail;
   std::string path;    // at most 260 bytes
@@ -83,6 +85,7 @@ class ThumbnailDatabase {
   ThumbnailDatabase& operator=(const ThumbnailDatabase&) = delete;
   ~ThumbnailDatabase() { CloseThumbnailDatabase(); }
 
+  // What became of opening a database.
   enum class Opened {
     Done,
     Missing,
@@ -116,6 +119,7 @@ class ThumbnailDatabase {
   // Marks every record of a path deleted, whatever its volume; how many there were, -1 when it could not be done.
   int64_t Delete(const std::string& path);
 
+  // What became of a compaction.
   enum class Compacted {
     Done,
     NotRead,  // a record cannot be read, or the header counts more than there are

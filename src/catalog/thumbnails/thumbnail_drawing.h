@@ -10,6 +10,7 @@ namespace fotomill {
 
 // Thumbnail records as a browser shows them.
 
+// A thumbnail of either size.
 using AnyThumbnailRecord = std::variant<ThumbnailRecord, LargeThumbnailRecord>;
 
 // Bits of `flags`. The large view wins over the half size.

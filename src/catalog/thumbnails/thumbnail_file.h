@@ -12,6 +12,7 @@ namespace fotomill {
 // Thumbnail files: one small record in a file beside the picture, of the picture's base name and the extension ".THN".
 // Pictures that differ in their extension only share one.
 
+// The extension of thumbnail files. It is written in capitals and read in any case.
 inline constexpr std::string_view kThumbnailExtension = ".THN";
 
 // The thumbnail file of a picture; a new text, which stays.

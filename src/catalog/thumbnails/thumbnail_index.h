@@ -42,6 +42,7 @@ class ThumbnailIndex {
   // Paths that differ in their extension only have the same hash, which is never 0.
   static uint32_t HashOf(std::string_view path);
 
+  // Forgets all records, and how many there are, those that cannot be found included.
   void Clear();
   size_t Count() const { return hashes_.size(); }
   // Takes in the next record: its hash, or 0 for one that cannot be found.

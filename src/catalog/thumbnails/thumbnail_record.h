@@ -29,12 +29,14 @@ inline constexpr int32_t kLargeThumbnailSide = 176;
 inline constexpr std::string_view kSmallThumbnailMagic = "THNL";
 inline constexpr std::string_view kLargeThumbnailMagic = "tHNL";
 
+// A record of either size. It holds its bytes as they stand in a file.
 template <int32_t side>
 struct SquareThumbnailRecord {
   static constexpr int32_t kSide = side;
   static constexpr size_t kStride = size_t{3} * side;
   std::array<uint8_t, kThumbnailHeaderSize + kStride * side> bytes{};
 
+  // The header's fields; a record that was never signed has version 0 and no magic.
   int16_t Version() const { return static_cast<int16_t>(bytes[4] | bytes[5] << 8); }
   bool HasMagic(std::string_view magic) const {
     for (size_t i = 0; i < magic.size(); ++i) {
@@ -63,6 +65,7 @@ struct SquareThumbnailRecord {
     return std::span(bytes).subspan(kThumbnailHeaderSize + static_cast<size_t>(r) * kStride, kStride);
   }
 };
+// The small record, of files and the database, and the large one, of the large view.
 using ThumbnailRecord = SquareThumbnailRecord<kSmallThumbnailSide>;
 using LargeThumbnailRecord = SquareThumbnailRecord<kLargeThumbnailSide>;
 static_assert(sizeof(ThumbnailRecord) == 27912 && sizeof(LargeThumbnailRecord) == 93192);

@@ -12,6 +12,7 @@ namespace fotomill {
 // What a browser does about thumbnails once it has listed a folder: makes the records that live in memory only, removes
 // thumbnail files that have lost their picture, and offers to make those that are missing.
 
+// What the work needs to know of a browser, and what it keeps in it.
 struct ThumbnailBrowser {
   std::string folder;
   std::vector<std::string> files;  // names in its list, all files of the folder that it shows, without folders and drives

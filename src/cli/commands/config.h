@@ -4,6 +4,8 @@
 
 namespace fotomill::cli {
 
+// Commands "config list", "get", "set", "unset" and "path": declare names and options in `app` and
+// set context.run.
 void SetUpConfigList(CLI::App& app, CommandContext& context);
 void SetUpConfigGet(CLI::App& app, CommandContext& context);
 void SetUpConfigSet(CLI::App& app, CommandContext& context);

@@ -4,6 +4,8 @@
 
 namespace fotomill::cli {
 
+// Command "convert": declares its options in `app` and sets context.run, which converts the named
+// files as one batch.
 void SetUpConvert(CLI::App& app, CommandContext& context);
 
 }  // namespace fotomill::cli

@@ -4,6 +4,8 @@
 
 namespace fotomill::cli {
 
+// Command "exif": declares its options in `app` and sets context.run, which lists EXIF or extracts
+// its thumbnail.
 void SetUpExif(CLI::App& app, CommandContext& context);
 
 }  // namespace fotomill::cli

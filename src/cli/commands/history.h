@@ -4,6 +4,8 @@
 
 namespace fotomill::cli {
 
+// Commands "history list", "add" and "clear": declare names and options in `app` and set
+// context.run.
 void SetUpHistoryList(CLI::App& app, CommandContext& context);
 void SetUpHistoryAdd(CLI::App& app, CommandContext& context);
 void SetUpHistoryClear(CLI::App& app, CommandContext& context);

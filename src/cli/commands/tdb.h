@@ -4,6 +4,8 @@
 
 namespace fotomill::cli {
 
+// Commands "tdb add", "find", "list", "delete" and "compact": declare names and options in `app`
+// and set context.run.
 void SetUpTdbAdd(CLI::App& app, CommandContext& context);
 void SetUpTdbFind(CLI::App& app, CommandContext& context);
 void SetUpTdbList(CLI::App& app, CommandContext& context);

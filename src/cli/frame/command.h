@@ -28,6 +28,8 @@ struct NameArguments {
   size_t most = 0;
   std::vector<std::string> values;  // any bytes, in order
 
+  // Says what a command takes: `shownAs` and `helpText` go into the help, fewer or more names than
+  // the bounds are a usage error.
   void Declare(const char* shownAs, const char* helpText, size_t fewest, size_t greatest = SIZE_MAX) {
     placeholder = shownAs;
     help = helpText;
@@ -57,6 +59,7 @@ struct CommandContext {
   NameArguments names;
   std::function<int()> run;  // after parsing; returns the exit status
 
+  // Whether there is somebody to ask.
   bool MayAsk() const { return io.Interactive() && !global.noInput; }
   // Whether someone watches how far the command is.
   bool ProgressOn() const { return io.errTerminal && !global.quiet && global.progress != "never"; }

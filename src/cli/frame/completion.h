@@ -4,6 +4,7 @@
 
 namespace fotomill::cli {
 
+// Command "completion": sets context.run, which prints the script for bash, zsh or fish.
 void SetUpCompletion(CLI::App& app, CommandContext& context);
 
 }  // namespace fotomill::cli

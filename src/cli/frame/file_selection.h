@@ -13,6 +13,7 @@ namespace fotomill::cli {
 // folder that was named.
 using SelectedFile = BatchFile;
 
+// How the named files and folders become a selection.
 struct SelectionOptions {
   bool recursive = false;
   std::string filesFrom;

@@ -12,6 +12,7 @@
 
 namespace fotomill::cli {
 
+// Members keep the order in which they were set.
 using Json = nlohmann::ordered_json;
 
 // Sets `key` to a name. One that is not UTF-8 also sets `key` + "Bytes", its bytes in base64; `key` then has U+FFFD in
@@ -30,6 +31,7 @@ class ResultOutput {
   ResultOutput& operator=(const ResultOutput&) = delete;
   ~ResultOutput();  // ends the array, whatever happened
 
+  // Whether results are elements of a JSON array.
   bool IsJson() const { return json_; }
   // A name as a line shows it: escaped on a terminal, byte for byte elsewhere.
   std::string Shown(std::string_view name) const;

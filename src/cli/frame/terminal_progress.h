@@ -16,6 +16,7 @@ class TerminalProgress {
   TerminalProgress& operator=(const TerminalProgress&) = delete;
   ~TerminalProgress() { Clear(); }
 
+  // Starts at 0 of `total`, and counts on to `done` of them; Tick draws it.
   void Begin(uint64_t total);
   void Done(uint64_t done);
   // Draws the line when it is time to.

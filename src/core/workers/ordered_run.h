@@ -15,6 +15,7 @@ namespace fotomill {
 // other.
 class OrderedRun {
  public:
+  // What is done with items, and when.
   struct Steps {
     std::function<Status(size_t item)> work;  // on any thread, several at a time
     // On the calling thread, in order, once the item's work is done: with what it returned, or MemoryAllocationError where it

@@ -25,6 +25,8 @@ class StopToken {
 // Stops the work of those who hold its tokens; once stopped, it stays so. Copies are the same source.
 class StopSource {
  public:
+  // Asks for the end; whoever works notices it at its next look at the token. Any thread may call
+  // both.
   void Stop() const { stopped_->store(true, std::memory_order_relaxed); }
   StopToken Token() const { return StopToken(stopped_); }
 

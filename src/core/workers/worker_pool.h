@@ -35,6 +35,7 @@ class WorkerPool {
   // ending. Its tasks' owners wait for theirs.
   static WorkerPool& Shared();
 
+  // How many tasks and helpers the pool lets compute at a time, at least 1.
   unsigned Cores() const { return cores_; }
 
   // Has a task run on a thread of the pool. An exception that leaves it is dropped: who wants to know wraps its work in Guarded.

@@ -16,6 +16,7 @@ class ExifBytes {
   ExifBytes() = default;
   ExifBytes(std::span<const uint8_t> bytes, bool bigEndian) : bytes_(bytes), bigEndian_(bigEndian) {}
 
+  // The block, and numbers at offsets from its start in its own byte order.
   uint64_t Size() const { return bytes_.size(); }
   bool BigEndian() const { return bigEndian_; }
   uint8_t U8(uint64_t offset) const { return offset < bytes_.size() ? bytes_[offset] : uint8_t{0}; }
@@ -100,8 +101,10 @@ inline ExifField ReadExifField(const ExifBytes& block, uint64_t offset) {
   return field;
 }
 
+// The header: byte order, magic number, offset of the first directory. Source: TIFF 6.0, section 2.
 inline constexpr uint16_t kExifMagic = 42;
 inline constexpr uint64_t kExifHeaderSize = 8;
+// Tags whose values are offsets and sizes in the block. Source: CIPA DC-008-2012, section 4.6.
 inline constexpr uint16_t kExifPointerTag = 0x8769;
 inline constexpr uint16_t kGpsPointerTag = 0x8825;
 inline constexpr uint16_t kThumbnailOffsetTag = 0x0201;

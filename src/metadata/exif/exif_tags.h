@@ -73,6 +73,7 @@ struct ExifTag {
   const ExifWordList* words = nullptr;  // for ExifRule::Words and Components
 };
 
+// Stands for no row of the dictionary.
 inline constexpr int32_t kNoExifTag = -1;
 
 // The dictionary in the order in which the editor offers it; each tag number stands in it once.

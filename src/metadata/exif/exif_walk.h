@@ -24,6 +24,7 @@ class ExifSink {
   virtual void Line(const ExifLine& line) = 0;
 };
 
+// For WalkExif: lines of every directory.
 inline constexpr int32_t kAllExifDirectories = -1;
 
 // What a walk found beside its lines. Offsets are from the start of the block, 0 for none.

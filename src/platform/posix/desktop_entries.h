@@ -21,6 +21,7 @@ struct Associations {
   std::vector<std::string> programs;  // the default first
   std::vector<std::string> removed;
 };
+// Those of one type in the text of a "mimeapps.list" or "mimeinfo.cache".
 Associations AssociationsIn(std::string_view list, std::string_view type);
 
 // The program of a desktop entry's text. nullopt for an entry that is hidden, is no application or runs in a terminal.

@@ -23,6 +23,7 @@ class Handle {
   Handle& operator=(const Handle&) = delete;
   ~Handle() { Reset(); }
 
+  // The system's number, -1 for none. Release hands the file over to the caller, who closes it.
   int Number() const { return number_; }
   bool IsOpen() const { return number_ >= 0; }
   int Release() {

@@ -18,7 +18,7 @@ struct ColorBin {
 class ColorCells {
  public:
   Status Open();  // MemoryAllocationError
-  void AddRow(const uint8_t* bgr, int32_t width);
+  void AddRow(const uint8_t* bgr, int32_t width);  // pixels of three bytes
   // The cells that hold pixels.
   std::vector<ColorBin> Bins();
 

@@ -23,6 +23,7 @@ class FilterWindows {
   // Windows for `count` output pixels. `mostShift` bounds the weights' precision. MemoryAllocationError.
   Status Make(const SourceEdge& edge, int32_t count, ScaleFilter filter, int32_t mostShift);
 
+  // In the order of the output pixels; they hold until the next Make.
   std::span<const FilterWindow> Windows() { return windows_.Items<FilterWindow>(); }
   const FilterWindow& Window(int32_t i) { return Windows()[static_cast<size_t>(i)]; }
   int32_t Shift() const { return shift_; }        // the weights of a window add up to 2^shift

@@ -26,6 +26,7 @@ struct Turn {
   bool swap, flipX, flipY;
   bool operator==(const Turn&) const = default;
 };
+// By the number of the orientation, from 1.
 inline constexpr Turn kTurns[] = {{false, false, false}, {false, true, false}, {false, true, true}, {false, false, true},
                                   {true, false, false},  {true, false, true},  {true, true, true},  {true, true, false}};
 

@@ -19,6 +19,7 @@ struct FilterWindow {
   const int16_t* weights;
 };
 
+// One set of loops; every pointer is set.
 struct ResampleKernels {
   // Adds up `window.taps` rows by weight: samples of whole gray levels, or of the fraction above. `samples` are written,
   // in blocks of kWeighedAtOnce of which the last may overlap the one before.

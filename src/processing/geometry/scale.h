@@ -10,6 +10,7 @@
 
 namespace fotomill {
 
+// Width and height of a picture or an image.
 struct Size {
   int32_t width, height;  // pixels
 };

@@ -11,6 +11,7 @@ namespace fotomill {
 // Each function turns one row of pixels into one byte each: an index into the palette that `nearest` searches, or 1 for
 // white and 0 for black of a row of brightnesses.
 
+// Each pixel takes the color nearest to it.
 void MapRow(const uint8_t* bgr, int32_t width, NearestColor& nearest, uint8_t* indices);
 // `y` chooses the row of the threshold pattern; `spread` is the distance of two colors that it is to bridge.
 void OrderRow(const uint8_t* bgr, int32_t width, int32_t y, int32_t spread, NearestColor& nearest, uint8_t* indices);

@@ -17,6 +17,7 @@ Status FitPalette(const std::vector<ColorBin>& bins, int32_t colors, ColorPoints
 // Sums of the pixels that took each color.
 class ColorMeans {
  public:
+  // Takes in one row: pixels of three bytes, and the index of the color that each took.
   void AddRow(const uint8_t* bgr, const uint8_t* indices, int32_t width);
   // Moves each color to the mean of its pixels; one that no pixel took stays.
   void Move(ColorPoints& points) const;

@@ -15,6 +15,7 @@ enum class Dither : int32_t {
   FloydSteinberg = 2,  // each pixel's error goes to its neighbours (Floyd and Steinberg 1976)
 };
 
+// How colors are reduced; ReduceColors without options takes them from the keys.
 struct ReduceOptions {
   Dither colorDither = Dither::FloydSteinberg;
   Dither monoDither = Dither::FloydSteinberg;

@@ -27,6 +27,7 @@ struct OverwritePreview {
 class BatchWindows {
  public:
   virtual ~BatchWindows() = default;
+  // A batch begins; its box comes up, empty.
   virtual void BatchOpened() = 0;
   // `outcome` is that of the file that the line is about, empty for lines about the batch.
   virtual void BatchLine(const ProgressLine& line, const FileOutcome& outcome) = 0;
@@ -57,6 +58,8 @@ class BatchThread {
   BatchThread(const BatchThread&) = delete;
   BatchThread& operator=(const BatchThread&) = delete;
 
+  // Begins RunBatch with these; to be called when nothing runs. `job.box` and `job.prompts` are set
+  // here.
   void Start(std::vector<BatchFile> files, BatchFunction function, BatchJob job);
   // Any other work that reports to a box: `work` gets the job, with box and prompts set, and returns its status.
   using Work = std::function<Status(BatchJob& job)>;

@@ -14,6 +14,7 @@ struct DestinationFormat {
   std::string description;  // "(PNG) Portable Network Graphics"
   int32_t row = kNoFormat;  // of the registry; the spare row for plug-in formats
 };
+// What can be written, in the order of the registry, plug-in formats last.
 std::vector<DestinationFormat> DestinationFormats();
 
 // What the destination step asks for.

@@ -19,12 +19,13 @@ enum class MatchMode { Only, Add, TakeOut };
 // among the lines. No window, no file access.
 class BrowserModel {
  public:
+  // The folder, and how it is shown.
   const std::string& Folder() const { return folder_; }
   const BrowserModes& Modes() const { return view_.modes; }
   bool Descending() const { return view_.descending; }
   const FolderView& View() const { return view_; }
   void SetView(const FolderView& view);  // sorts anew where the order changes
-  void SetSort(int32_t sortMode, bool descending);
+  void SetSort(int32_t sortMode, bool descending);  // choice::SortMode
 
   // Another folder, empty until its listing comes.
   void SetFolder(const std::string& folder);
@@ -39,6 +40,8 @@ class BrowserModel {
   void SetFilter(const std::string& filter);
   const std::string& Filter() const { return filter_; }
 
+  // Items are what the folder holds, lines what the filter lets pass, both from 0. The model keeps
+  // what is returned until the next change.
   size_t ItemCount() const { return items_.size(); }
   const FolderItem& Item(size_t item) const { return items_[item]; }
   size_t LineCount() const { return lines_.size(); }
@@ -50,6 +53,7 @@ class BrowserModel {
   // The next line whose name begins with `typed`, from the focus on: `typed` of one letter typed again goes on to the next.
   size_t FindTyped(std::string_view typed, bool next) const;
 
+  // The selection of lines. Whoever changes it shows it.
   Selection& Selected() { return selection_; }
   const Selection& Selected() const { return selection_; }
   // What functions work on: the selected files in list order; without a selection the focused one.

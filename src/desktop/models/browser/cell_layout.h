@@ -8,6 +8,7 @@
 
 namespace fotomill::desktop {
 
+// A rectangle of the list, in pixels; right and bottom edges are outside.
 struct Rect {
   int32_t x = 0, y = 0, width = 0, height = 0;
 
@@ -15,6 +16,7 @@ struct Rect {
   bool operator==(const Rect&) const = default;
 };
 
+// Where a key takes the focus.
 enum class Step { Left, Right, Up, Down, PageUp, PageDown, First, Last };
 
 // Where the cells of a thumbnail list lie: rows of equal cells, as many to a row as fit, in a window that scrolls
@@ -26,12 +28,14 @@ class CellLayout {
   void SetWindow(int32_t width, int32_t height);
   void SetCount(size_t count) { count_ = count; }
 
+  // The grid, and how far down a window can scroll so that no room is left below the last row.
   int32_t Columns() const { return columns_; }
   int64_t Rows() const { return (static_cast<int64_t>(count_) + columns_ - 1) / columns_; }
   int32_t RowHeight() const { return cellHeight_ + gap_; }
   int64_t TotalHeight() const { return Rows() * RowHeight() + gap_; }
   int64_t LargestScroll() const;
 
+  // Where a line's cell lies in the list.
   Rect Cell(size_t line) const;
   // The line whose cell lies at a point of the list, kNoLine between cells.
   size_t LineAt(int32_t x, int64_t y) const;
@@ -39,7 +43,7 @@ class CellLayout {
   struct Range {
     size_t first = 0, end = 0;
   };
-  Range Visible(int64_t scroll) const { return LinesBetween(scroll, scroll + windowHeight_); }
+  Range Visible(int64_t scroll) const { return LinesBetween(scroll, scroll + windowHeight_); }  // rows in part included
   // Lines whose rows touch the band between two heights.
   Range LinesBetween(int64_t top, int64_t bottom) const;
   // Lines whose cells touch a rectangle of the list: the rubber band.

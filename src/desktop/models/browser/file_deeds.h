@@ -21,6 +21,7 @@ enum class DeedKind {
 
 class PreviousFile;
 
+// One file of a deed, by absolute paths.
 struct FileStep {
   std::string from;
   std::string to;                               // empty for Trash and Turn
@@ -33,6 +34,7 @@ struct FileDeed {
   std::vector<FileStep> steps;
 };
 
+// Why a step was not done.
 struct DeedFailure {
   std::string path;
   std::string reason;  // a whole sentence

@@ -20,6 +20,7 @@ struct FolderItem {
   bool operator==(const FolderItem&) const = default;
 };
 
+// What reading a folder gave; no items where it cannot be read.
 struct FolderListing {
   bool readable = false;
   std::vector<FolderItem> items;  // in no particular order

@@ -26,6 +26,7 @@ class FolderViews {
   FolderView Find(const std::string& folder, const FolderView& otherwise) const;
   void Keep(const std::string& folder, const FolderView& view);
 
+  // Takes up what the file holds; without one, nothing is kept of any folder.
   void Load();
   // Merges what was kept since the last call into the file, which other processes change too. False when it cannot be written.
   [[nodiscard]] bool Save();

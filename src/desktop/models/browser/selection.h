@@ -7,6 +7,7 @@
 
 namespace fotomill::desktop {
 
+// Stands for no line.
 inline constexpr size_t kNoLine = static_cast<size_t>(-1);
 
 // What is selected among the lines of a list, which line has the focus, and from where a range extends: the rules that
@@ -18,6 +19,8 @@ class Selection {
   // The list anew: `selected` for each line, and where focus and anchor are now, kNoLine for nowhere.
   void Assign(std::vector<bool> selected, size_t focus, size_t anchor);
 
+  // How many lines there are and how many are selected; focus and anchor are kNoLine when they are
+  // nowhere.
   size_t Count() const { return selected_.size(); }
   size_t SelectedCount() const { return selectedCount_; }
   bool IsSelected(size_t line) const { return line < selected_.size() && selected_[line]; }

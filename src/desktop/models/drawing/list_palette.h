@@ -4,6 +4,7 @@
 
 namespace fotomill::desktop {
 
+// A color of the screen, in sRGB.
 struct Shade {
   uint8_t red = 0, green = 0, blue = 0;
 

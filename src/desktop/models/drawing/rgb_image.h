@@ -15,6 +15,7 @@ struct RgbImage {
   int32_t width = 0, height = 0;
   std::vector<uint8_t> bytes;
 
+  // Row y, from the top, holds 3 x width bytes.
   bool Empty() const { return bytes.empty(); }
   uint8_t* Row(int32_t y) { return bytes.data() + static_cast<size_t>(y) * static_cast<size_t>(width) * 3; }
   const uint8_t* Row(int32_t y) const { return bytes.data() + static_cast<size_t>(y) * static_cast<size_t>(width) * 3; }

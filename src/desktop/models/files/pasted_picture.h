@@ -9,6 +9,7 @@
 
 namespace fotomill::desktop {
 
+// A picture from the clipboard or from a drag.
 struct PastedPicture {
   RgbImage pixels;
   std::vector<uint8_t> alpha;  // a byte a pixel, top row first; empty for none

@@ -16,9 +16,11 @@ struct HistoryColumnFacts {
   KeyNumber width;
   bool number;  // stands at the right
 };
+// All columns, and what the widths of those that are shown add up to.
 std::span<const HistoryColumnFacts> HistoryColumns();
 inline constexpr int32_t kWholeWidth = 10000;
 
+// An entry of the history, kept after the history itself was freed.
 struct HistoryRow {
   std::string path;
   int32_t function = 0;
@@ -37,6 +39,8 @@ class FileHistoryList {
   int32_t SortColumn() const { return column_; }
   bool Reversed() const { return reversed_; }
 
+  // Rows from 0 in the order shown; a cell's text is as the list shows it, dates and sizes in
+  // words.
   size_t Count() const { return rows_.size(); }
   const HistoryRow& Row(size_t row) const { return rows_[row]; }
   std::string Cell(size_t row, size_t column) const;

@@ -10,6 +10,7 @@
 
 namespace fotomill::desktop {
 
+// A line of the report: a label with its value.
 struct InfoLine {
   std::string label;  // empty for a line that is a text of its own
   std::string value;

@@ -10,10 +10,12 @@ extern const std::string_view kSettingsPage;       // docs/settings.md: an entry
 extern const std::string_view kConfigurationPage;  // docs/configuration.md
 extern const std::string_view kDesktopPage;        // docs/desktop.md, the manual
 
+// A text of the documentation, ready to be shown.
 struct HelpText {
   std::string title;
   std::string text;  // paragraphs, divided by empty lines; blocks that are set in keep their lines
 };
+// The topic that stands for the whole manual.
 inline constexpr std::string_view kManual = "desktop";
 // The entry of a key, the part of the manual for a topic that a Help button names, or the manual; for anything else the
 // page about the configuration as a whole.

@@ -23,6 +23,7 @@ struct SetupItem {
   KeyNumber key;
   const char* label;
 };
+// All rows, and those of one page, in the order in which they are shown.
 std::span<const SetupItem> SetupItems();
 std::vector<SetupItem> ItemsOf(SetupPage page);
 

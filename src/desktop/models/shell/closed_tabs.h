@@ -9,6 +9,7 @@ namespace fotomill::desktop {
 // The folders of the tabs that were closed last, TabHistoryMax at most. They are kept for later runs.
 class ClosedTabs {
  public:
+  // Takes up the list of earlier runs. Add puts a folder on top and writes the list.
   void Load();
   bool Empty() const { return folders_.empty(); }
   void Add(const std::string& folder);

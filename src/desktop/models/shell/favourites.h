@@ -9,6 +9,7 @@ namespace fotomill::desktop {
 // "FMWFavourites.txt", a folder a line; changes are merged with those of other processes and written at once.
 class Favourites {
  public:
+  // Takes up the folders that the file holds now.
   void Load();
   const std::vector<std::string>& Folders() const { return folders_; }
   bool Has(const std::string& folder) const;

@@ -24,6 +24,7 @@ struct SessionTab {
 
   bool operator==(const SessionTab&) const = default;
 };
+// A frame with its tabs.
 struct Session {
   int32_t width = 0, height = 0;  // 0: nothing is known
   bool maximized = false;
@@ -34,6 +35,7 @@ struct Session {
   bool operator==(const Session&) const = default;
 };
 
+// Reads the text of a session; what is missing or makes no sense is as in a new one.
 Session ParseSession(std::string_view text);
 // Tabs whose folder cannot stand on a line are left out.
 std::string SessionText(const Session& session);

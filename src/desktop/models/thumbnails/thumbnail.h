@@ -21,6 +21,7 @@ struct ThumbnailWish {
   bool operator==(const ThumbnailWish&) const = default;
 };
 
+// What a list shows of a picture. It does not change once it is made, so that threads may share it.
 struct Thumbnail {
   Status status = Status::Ok;                          // why there are no pixels
   RgbImage pixels;                                     // never larger than the square, nor enlarged

@@ -19,6 +19,7 @@ namespace fotomill::desktop {
 // again.
 class ThumbnailLoader {
  public:
+  // A wish that was dealt with.
   struct Result {
     ThumbnailWish wish;
     ThumbnailPointer thumbnail;

@@ -22,6 +22,8 @@ class ThumbnailOffer : public std::enable_shared_from_this<ThumbnailOffer> {
     std::function<void(size_t done, size_t total)> building;
     std::function<void(bool changed, const ThumbnailBrowser& browser)> ended;
   };
+  // Begins to look for what is missing. The offer lives until its thread has ended, whoever lets go
+  // of it.
   static std::shared_ptr<ThumbnailOffer> Start(ThumbnailBrowser browser, Events events);
 
   // The answer: one of the choices, or 0.

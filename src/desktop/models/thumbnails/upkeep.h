@@ -21,6 +21,7 @@ class DatabaseCompaction : private ProgressSink {
   DatabaseCompaction(const DatabaseCompaction&) = delete;
   DatabaseCompaction& operator=(const DatabaseCompaction&) = delete;
 
+  // Asks it to stop, whether it has ended either way, and how many records it has dealt with.
   void Stop() { stop_ = true; }
   bool Ended() const { return ended_; }
   int32_t Done() const { return done_; }

@@ -28,6 +28,8 @@ class AnimationPlayer {
   // Seconds until At moves on; negative when it never does by itself: paused, at the end, or waiting for a frame.
   double SecondsLeft(double now) const;
 
+  // The frame that is shown, from 0, of how many are known so far; why decoding ended, Ok while it
+  // has not failed.
   size_t Frame() const { return frame_; }
   size_t Count() const { return frames_.Count(); }
   Status Failure() const { return frames_.Failure(); }

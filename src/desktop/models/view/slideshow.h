@@ -8,6 +8,7 @@
 
 namespace fotomill::desktop {
 
+// What the user chose of a slide show.
 struct SlideshowChoices {
   static constexpr int32_t kMostSeconds = 3600;
 

@@ -21,6 +21,7 @@ struct ViewLook {
   bool profiles = false;   // in the colors that its color profile means
   bool keepAlpha = false;  // with its alpha plane, instead of on ViewModeBackground
 
+  // From the keys as they are now.
   static ViewLook FromSettings();
   bool operator==(const ViewLook&) const = default;
 };
@@ -36,6 +37,7 @@ struct ViewWish {
   int32_t fitWidth = 0, fitHeight = 0;  // device pixels, 0 for none
   ViewLook look = ViewLook::FromSettings();
 
+  // Whether both mean the same pixels, whatever window they are to fit.
   bool SamePicture(const ViewWish& other) const { return path == other.path && page == other.page && look == other.look; }
 };
 
@@ -54,10 +56,12 @@ struct ViewPicture {
   std::vector<std::string> photo;  // what the camera wrote about it, in lines
   double seconds = 0;              // that decoding took
 
+  // What it takes of memory, for caches.
   uint64_t Bytes() const;
   // Whether the file has become another one since.
   bool HasChanged() const;
 };
+// Shared between threads; nobody changes it once it is made.
 using ViewPicturePointer = std::shared_ptr<const ViewPicture>;
 
 // "4000 x 3000 pixels, 3.2 MB, 25%" of a picture at a scale.
@@ -113,6 +117,7 @@ class ViewScaler {
   ViewScaler(const ViewScaler&) = delete;
   ViewScaler& operator=(const ViewScaler&) = delete;
 
+  // Wants the picture scaled to a size in device pixels, in place of an earlier request.
   void Request(ViewPicturePointer picture, int32_t width, int32_t height);
   struct Scaled {
     ViewPicturePointer picture;

@@ -4,6 +4,8 @@
 
 namespace fotomill::desktop {
 
+// How the scale follows the window: all of the picture in it, its width alone, the window filled,
+// or not at all.
 enum class ZoomMode { Fit, FitWidth, Fill, Free };
 
 // Zoom and place in relation to a picture and a window, so that they mean the same for others.
@@ -37,6 +39,7 @@ class ViewTransform {
   // To the middle; a zoom of its own gives way to what the key stands for, fitting stays.
   void StartAfresh(int32_t zoom);
 
+  // How the scale is found, and pixels of the screen a pixel of the picture.
   ZoomMode Mode() const { return mode_; }
   double Scale() const { return scale_; }
   // Size on the screen, at least a pixel.

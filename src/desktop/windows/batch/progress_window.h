@@ -20,6 +20,7 @@ namespace fotomill::desktop {
 // The progress box: lists files as they are processed, with Abort while the batch runs and Close after it. Not modal.
 class ProgressWindow : public wxFrame {
  public:
+  // What the box tells its owner. They are called on the main thread.
   struct Events {
     std::function<void()> abort;
     std::function<void(ProgressWindow& box)> closed;                          // the user is done with the box
@@ -27,6 +28,8 @@ class ProgressWindow : public wxFrame {
   };
   ProgressWindow(wxWindow* frame, ThumbnailService& thumbnails, Events events);
 
+  // Shows what the batch reports. `source` is the file that the line is about, for its thumbnail;
+  // empty for none.
   void AddLine(const ProgressLine& line, const std::string& source);
   void SetStatus(const std::string& status);
   void SetProgress(uint32_t done, uint32_t count);

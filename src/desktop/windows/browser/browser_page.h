@@ -28,8 +28,10 @@ class BrowserHost {
   virtual ~BrowserHost() = default;
   virtual void BrowserChanged() = 0;     // folder, selection, modes or counts
   virtual DetailColumns& Columns() = 0;  // of the details of all browsers
+  // How the user wants the folder shown from now on.
   virtual void KeepView(const std::string& folder, const FolderView& view) = 0;
   virtual const FolderViews& Views() = 0;  // how folders are to be shown
+  // What the user did to files of the browser: the frame does it.
   virtual void ViewFile(const std::string& path) = 0;
   virtual void ShowContextMenu(wxWindow& window, const wxPoint& place, bool onFile) = 0;
   virtual void RenameFile(const std::string& path, const std::string& name) = 0;
@@ -50,8 +52,11 @@ class BrowserPage : public wxPanel {
   void GoForward() { StepAlongTrail(1); }
   void GoUp();
 
+  // What the browser shows. After a change of its selection, SelectionChanged is to be called.
   const BrowserModel& Model() const { return model_; }
   BrowserModel& Model() { return model_; }
+  // By choice::ViewMode, choice::ThumbnailMode and choice::SortMode; the folder's view is kept as
+  // well.
   void SetViewMode(int32_t mode);
   void SetThumbnailMode(int32_t mode);
   void SetSort(int32_t sort, bool descending);

@@ -16,12 +16,14 @@ namespace fotomill::desktop {
 // The way to a folder: a button for each folder on it, and behind each a button that lists the folders in it.
 class CrumbStrip : public wxPanel {
  public:
+  // What the user did in it.
   struct Events {
     std::function<void(const std::string& folder)> open;
     std::function<void()> edit;  // empty space was clicked
   };
   CrumbStrip(wxWindow* parent, Events events);
 
+  // Makes the buttons for a folder; those at the front that do not fit are left out.
   void ShowFolder(const std::string& folder);
 
  private:

@@ -12,6 +12,7 @@ namespace fotomill::desktop {
 // The details view of a browser: a native list, which screen readers know how to read.
 class DetailsList : public wxDataViewCtrl {
  public:
+  // What the user did in it; lines are those of the model.
   struct Events {
     std::function<void()> selectionChanged;
     std::function<void(size_t line)> activated;

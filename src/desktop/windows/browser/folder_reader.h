@@ -16,6 +16,7 @@ using PlacedItems = std::vector<std::pair<size_t, FolderItem>>;
 // Reads a browser's folder apart from the window: what lies in it, and what only the headers of files tell.
 class FolderReader {
  public:
+  // Called on the window's thread, never after the reader has gone.
   struct Events {
     std::function<void(FolderListing listing, bool complete)> listed;
     std::function<void(const PlacedItems& found, bool last)> factsFound;

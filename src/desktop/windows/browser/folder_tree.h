@@ -17,6 +17,7 @@ namespace fotomill::desktop {
 // Folders are read when they open, on a thread of their own.
 class FolderTree : public wxTreeCtrl {
  public:
+  // What the user did in it.
   struct Events {
     std::function<void(const std::string& folder)> chosen;
     std::function<void(const std::string& folder)> openInTab;

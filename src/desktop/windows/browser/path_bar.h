@@ -20,6 +20,7 @@ class FolderTrail;
 // Where a browser is, and the ways from there: back, forward, up, a folder on the way or below it, or one that is typed.
 class PathBar : public wxPanel {
  public:
+  // What the user did in it.
   struct Events {
     std::function<void(int steps)> step;  // back or ahead along the trail
     std::function<void()> up;
@@ -29,6 +30,7 @@ class PathBar : public wxPanel {
   // The trail is the browser's; it outlives the bar.
   PathBar(wxWindow* parent, const FolderTrail& trail, Events events);
 
+  // The browser is there now: shows the way to it and which of the buttons lead on.
   void ShowFolder(const std::string& folder);
   // Lets the user type a folder in the place of the buttons.
   void Edit();

@@ -19,6 +19,8 @@ class ThumbnailService : public wxEvtHandler {
   ThumbnailService();
   ~ThumbnailService() override;
 
+  // The thumbnail that serves a wish, and any that is there of a file, whatever its size and age;
+  // null when there is none in the cache.
   ThumbnailPointer Find(const ThumbnailWish& wish) { return cache_.Find(wish); }
   ThumbnailPointer FindAny(const std::string& path) const { return cache_.FindAny(path); }
   // Replaces all wishes; only one browser is in front.

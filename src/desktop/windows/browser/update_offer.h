@@ -17,6 +17,7 @@ class UpdateBar;
 // A browser's offer to make the missing thumbnail files of its folder: the bar above the list, and what goes on behind it.
 class UpdateOffer {
  public:
+  // What the browser has to follow.
   struct Events {
     std::function<void()> answered;  // the bar has gone
     std::function<void()> made;      // there are new thumbnails

@@ -18,6 +18,7 @@ class Shell;
 // Two to four pictures beside each other, zoomed and moved together in parts of each. Commands go to the pane with the focus.
 class CompareFrame : public wxFrame {
  public:
+  // Whether so many files can be compared.
   static constexpr bool Takes(size_t files) { return files >= 2 && files <= 4; }
 
   CompareFrame(Shell& shell, const std::vector<std::string>& files);

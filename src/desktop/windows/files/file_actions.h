@@ -41,6 +41,7 @@ class FileActions : public wxEvtHandler {
   using Turned = std::function<void(bool done, const std::string& note)>;
   bool SaveTurned(const std::string& path, Orientation turn, Turned then);
 
+  // Takes back what was done last, or does it again; nothing while something is being done.
   void Undo();
   void Redo();
   // Somebody else did it; it can be taken back like the rest.

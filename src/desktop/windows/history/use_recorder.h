@@ -13,6 +13,7 @@ class UseRecorder {
  public:
   UseRecorder();
 
+  // Takes uses over; they are written within a moment, or by Flush.
   void Note(const std::vector<FileUse>& uses);
   // Writes what is still to be written.
   void Flush();

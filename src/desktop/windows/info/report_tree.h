@@ -13,6 +13,7 @@ class ReportTree : public wxTreeListCtrl {
  public:
   explicit ReportTree(wxWindow* parent);
 
+  // Replaces what is shown.
   void Show(std::span<const InfoSection> sections);
   // The value of the selected line; of a section, its title. Empty without a selection.
   wxString SelectedValue() const;

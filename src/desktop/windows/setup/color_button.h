@@ -8,6 +8,7 @@
 
 namespace fotomill::desktop {
 
+// The window class of the color selector.
 inline constexpr const char* kColorSelectBox = "COMMONColourSelectBox";
 
 // Asks for a color, beginning with one; both are 0x00BBGGRR. Nothing when the user cancels. Colors that were put aside
@@ -21,7 +22,7 @@ class ColorButton : public wxButton {
   ColorButton(wxWindow* parent, wxWindowID id, const wxString& title);
 
   void SetSetting(int32_t color);  // 0x00BBGGRR
-  int32_t Setting() const { return color_; }
+  int32_t Setting() const { return color_; }  // likewise
 
  private:
   const wxString title_;

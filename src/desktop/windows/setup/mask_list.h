@@ -12,6 +12,7 @@ class MaskList : public wxCheckListBox {
   MaskList(wxWindow* parent, wxWindowID id, const wxArrayString& names)
       : wxCheckListBox(parent, id, wxDefaultPosition, wxDefaultSize, names) {}
 
+  // Ticks the names of the bits that are set; Mask gives the number back as it is ticked now.
   void SetMask(int32_t mask) {
     mask_ = mask;
     for (unsigned bit = 0; bit < GetCount(); ++bit) Check(bit, (mask >> bit & 1) != 0);

@@ -21,6 +21,7 @@ class SettingsPanel : public wxScrolledWindow {
   SettingsPanel(wxWindow* parent, std::vector<SetupItem> items, std::function<void()> changed,
                 const std::function<wxWindow*(wxWindow*)>& above = {});
 
+  // The rows that it was made of.
   const std::vector<SetupItem>& Items() const { return items_; }
   // Marks what differs from its default; how many do.
   size_t UpdateMarks(const BoundControls& controls);

@@ -12,6 +12,7 @@ namespace fotomill::desktop {
 // AnimationViewModeToolbar. Hidden until there is something to tell.
 class AnimationBar : public wxPanel {
  public:
+  // What its buttons do.
   struct Events {
     std::function<void()> toggle;  // play or pause
     std::function<void(int frames)> step;

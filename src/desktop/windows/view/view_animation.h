@@ -16,6 +16,7 @@ namespace fotomill::desktop {
 // The animation in a view window: its frames come onto the canvas at their time, with the bar below it.
 class ViewAnimation {
  public:
+  // What its window does for it.
   struct Events {
     std::function<void()> changed;  // another frame is on the canvas, or the animation plays or pauses
     std::function<ViewPicturePointer(const ViewPicturePointer&)> dressed;  // a frame as it is to be shown; null if it cannot be

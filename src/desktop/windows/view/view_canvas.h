@@ -42,10 +42,12 @@ class ViewCanvas : public wxWindow {
   // Lines on top of the picture; empty for none.
   void SetOverlay(const std::vector<std::string>& lines);
 
+  // Zoom by a step, to one pixel a pixel, or by a mode, about the middle of the window.
   void ZoomIn() { ZoomBy(ViewTransform::kStep); }
   void ZoomOut() { ZoomBy(1 / ViewTransform::kStep); }
   void ZoomActual();
   void SetZoom(ZoomMode mode);
+  // Pixels of the screen a pixel of the picture, and whether more of it lies outside the window.
   double Zoom() const { return transform_.Scale(); }
   bool CanPan() const { return transform_.CanPan(); }
   // By eighths of the window.

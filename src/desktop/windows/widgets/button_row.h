@@ -8,6 +8,7 @@
 
 namespace fotomill::desktop {
 
+// A button of the row; wxID_CLOSE is the one apart.
 struct RowButton {
   wxWindowID id;
   const char* label;

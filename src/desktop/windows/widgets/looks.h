@@ -19,6 +19,7 @@ double TextScale(const wxWindow& window);
 // A width for text, given for texts of the usual size: wider where the user wants larger ones.
 int TextWidth(const wxWindow& window, int width);
 
+// The same color for the toolkit.
 inline wxColour ToWx(Shade shade) { return {shade.red, shade.green, shade.blue}; }
 
 }  // namespace fotomill::desktop
