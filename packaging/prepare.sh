@@ -7,7 +7,7 @@ Fail() {
   exit 1
 }
 
-# The packages of the given groups, one a line.
+# The packages of the given groups, one a line; alternatives as a|b.
 PackagesOf() {
   local line group='' wanted=" $* "
   while read -r line || [[ -n $line ]]; do
@@ -21,43 +21,48 @@ PackagesOf() {
   done <"$root/packages.txt"
 }
 
+# Of alternatives, one is enough.
 MissingPackages() {
-  local package installed
-  local -a packages
-  mapfile -t packages < <(PackagesOf "$@")
-  installed=$'\n'$(dpkg-query -W -f '${Package} ${db:Status-Status}\n' "${packages[@]}" 2>/dev/null)$'\n'
-  for package in "${packages[@]}"; do
-    [[ $installed == *$'\n'"$package installed"$'\n'* ]] || echo "$package"
+  local line installed
+  local -a lines names
+  mapfile -t lines < <(PackagesOf "$@")
+  mapfile -t names < <(printf '%s\n' "${lines[@]//|/$'\n'}")
+  installed=$(dpkg-query -W -f '${Package} ${db:Status-Status}\n' "${names[@]}" 2>/dev/null | sed -n 's/ installed$//p')
+  for line in "${lines[@]}"; do
+    grep -qxF "${line//|/$'\n'}" <<<"$installed" || echo "$line"
   done
 }
 
 # Installs what is missing of the given groups. With nothing missing it only asks dpkg.
 EnsurePackages() {
   local -a missing apt
+  local wanted
   if ! command -v dpkg-query >/dev/null; then
     Say "not a Debian or Ubuntu system; needed are the likes of:" $(PackagesOf "$@")
     return 0
   fi
   mapfile -t missing < <(MissingPackages "$@")
   ((${#missing[@]} > 0)) || return 0
+  printf -v wanted '%s, ' "${missing[@]//|/ | }"
+  wanted=${wanted%, }
 
   # dpkg wants the folders of the system's own programs, which a plain `su` leaves out of the path.
   apt=(env "PATH=$PATH:/usr/local/sbin:/usr/sbin:/sbin" DEBIAN_FRONTEND=noninteractive
        apt-get -qq -y -o DPkg::Lock::Timeout=300 -o Dpkg::Use-Pty=0)
   if ((EUID != 0)); then
     command -v sudo >/dev/null || Fail "missing packages, and no sudo to install them; as root run:" \
-      "apt-get install --no-install-recommends ${missing[*]}"
+      "apt-get satisfy --no-install-recommends '$wanted'"
     apt=(sudo "${apt[@]}")
   fi
   Say "installing ${missing[*]}"
   mkdir -p "$root/build"
   # The lists that are there usually do; only when they do not are they fetched anew.
-  if ! "${apt[@]}" install --no-install-recommends "${missing[@]}" >"$root/build/packages.log" 2>&1; then
+  if ! "${apt[@]}" satisfy --no-install-recommends "$wanted" >"$root/build/packages.log" 2>&1; then
     "${apt[@]}" update >>"$root/build/packages.log" 2>&1 &&
-      "${apt[@]}" install --no-install-recommends "${missing[@]}" >>"$root/build/packages.log" 2>&1 || {
+      "${apt[@]}" satisfy --no-install-recommends "$wanted" >>"$root/build/packages.log" 2>&1 || {
       tail -n 5 "$root/build/packages.log" >&2
       Fail "could not install packages (build/packages.log); as root run:" \
-        "apt-get install --no-install-recommends ${missing[*]}"
+        "apt-get satisfy --no-install-recommends '$wanted'"
     }
   fi
   packagesChanged=1

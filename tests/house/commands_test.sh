@@ -80,6 +80,9 @@ for tool in apt-get sudo; do printf '#!/bin/sh\nexit 1\n' >"$work/bin/$tool"; do
 chmod +x "$work"/bin/* && rm "$work"/bin/{ninja,cmake,dpkg-query}
 Expect "a package that cannot be had" "*as root run:*no-such-package-anywhere*1" \
   "$(PATH=$work/bin:$PATH "$tree/fotomill" </dev/null 2>&1; echo $?)"
+printf '[build]\nno-such-package | bash\nno-such-package | nor-this\n[cli]\n' >"$tree/packages.txt"
+Expect "alternatives, one of them there" "*satisfy --no-install-recommends 'no-such-package | nor-this'*1" \
+  "$(PATH=$work/bin:$PATH "$tree/fotomill" </dev/null 2>&1; echo $?)"
 printf '[build]\nbash\n[cli]\n[test]\n' >"$tree/packages.txt"
 
 # The check.

@@ -1,0 +1,43 @@
+# The libraries that decode and encode pictures, as `image_libraries` and `image_include_folders`.
+#
+# They are linked statically where the system has them so: loading them would cost every run, and most runs need none.
+# Which archives a static library needs in turn differs between releases; pkg-config knows. Where an archive is missing, or
+# the static set does not link, the shared libraries serve.
+find_package(PkgConfig REQUIRED)
+pkg_check_modules(IMAGES REQUIRED libtiff-4 libwebp libjpeg libpng lcms2 freetype2 libdeflate zlib)
+set(image_include_folders ${IMAGES_INCLUDE_DIRS})
+
+set(c_library_parts c m pthread dl rt stdc++ gcc_s)  # never from an archive in a program that loads the C library
+set(static_set "")
+foreach(name IN LISTS IMAGES_STATIC_LIBRARIES)
+  set(item ${name})
+  if(NOT name IN_LIST c_library_parts)
+    find_library(ARCHIVE_${name} NAMES lib${name}.a HINTS ${IMAGES_STATIC_LIBRARY_DIRS})
+    mark_as_advanced(ARCHIVE_${name})
+    if(ARCHIVE_${name})
+      set(item ${ARCHIVE_${name}})
+    endif()
+  endif()
+  list(APPEND static_set ${item})
+endforeach()
+list(REMOVE_DUPLICATES static_set)
+set(static_set "$<LINK_GROUP:RESCAN,${static_set}>")
+
+include(CheckCXXSourceCompiles)
+set(CMAKE_REQUIRED_LIBRARIES ${static_set} Threads::Threads)
+check_cxx_source_compiles([[
+extern "C" {
+char TIFFOpen(); char WebPDecode(); char WebPEncode(); char jpeg_start_decompress(); char jpeg_start_compress();
+char png_read_image(); char png_write_image(); char cmsCreateTransform(); char FT_Open_Face(); char inflate();
+char libdeflate_alloc_compressor();
+}
+int main() {
+  return TIFFOpen() + WebPDecode() + WebPEncode() + jpeg_start_decompress() + jpeg_start_compress() + png_read_image() +
+         png_write_image() + cmsCreateTransform() + FT_Open_Face() + inflate() + libdeflate_alloc_compressor();
+}]] STATIC_IMAGE_LIBRARIES_LINK)
+unset(CMAKE_REQUIRED_LIBRARIES)
+if(STATIC_IMAGE_LIBRARIES_LINK)
+  set(image_libraries ${static_set})
+else()
+  set(image_libraries ${IMAGES_LINK_LIBRARIES})
+endif()
