@@ -1,5 +1,6 @@
 #!/usr/bin/env python3
 """The browser and the view window of the real program, by keyboard."""
+import re
 import signal
 import time
 
@@ -8,14 +9,20 @@ from driven_desktop import Desktop, Failure, gif_of_frames, make_pictures, run
 NAMES = ["a1.bmp", "a2.png", "a10.jpg", "b.tif"]
 
 
-def register_program(data, marker):
-    """A program for PNG files that makes a file."""
+def register_programs(home, marker):
+    """Programs for PNG files: the one chosen, which makes a file; another one; one for terminals; one that was taken out."""
+    data = home / ".local/share"
     (data / "applications").mkdir(parents=True)
+    (home / ".config").mkdir(exist_ok=True)
     (data / "mime").mkdir()
     (data / "mime/globs2").write_text("50:image/png:*.png\n")
-    (data / "applications/marker.desktop").write_text(
-        f"[Desktop Entry]\nType=Application\nName=Marker\nExec=touch {marker} %F\nMimeType=image/png;\n")
-    (data / "applications/mimeapps.list").write_text("[Default Applications]\nimage/png=marker.desktop\n")
+    for name, more in (("Another", ""), ("Console", "Terminal=true\n"), ("Marker", ""), ("Unwanted", "")):
+        (data / f"applications/{name}.desktop").write_text(
+            f"[Desktop Entry]\nType=Application\nName={name}\nExec=touch {marker} %F\nMimeType=image/png;\n{more}")
+    (data / "applications/mimeinfo.cache").write_text(
+        "[MIME Cache]\nimage/png=Another.desktop;Console.desktop;Marker.desktop;Unwanted.desktop;\n")
+    (home / ".config/mimeapps.list").write_text(
+        "[Default Applications]\nimage/png=Marker.desktop\n[Removed Associations]\nimage/png=Unwanted.desktop;\n")
 
 
 def open_select_view(folder):
@@ -23,7 +30,7 @@ def open_select_view(folder):
     make_pictures(pictures, NAMES)
     (pictures / "broken.gif").write_bytes(b"GIF89a and no more")
     (pictures / "sub").mkdir()
-    register_program(folder / "home/.local/share", folder / "opened")
+    register_programs(folder / "home", folder / "opened")
     with Desktop(folder, pictures) as desktop:
         desktop.wait(r"browser tabs=1 lines=6 items=6 selected=0 missing=0 listing=0")
         desktop.screenshot("browser")
@@ -48,7 +55,9 @@ def open_select_view(folder):
         desktop.wait(r"selected=3 ")
         desktop.focus("Fotomill Professional")
         desktop.key("Home", "Right", "Right", "shift+F10")
-        desktop.wait(r"programs [1-9]")
+        programs = desktop.wait(r"programs Marker;(.*;|)Another;.*")
+        if re.search("Console|Unwanted", programs):
+            raise Failure(programs)
         desktop.settle()
         desktop.key("Up", "Right", "Return")
         desktop.wait(r"open-with Marker$")

@@ -3,12 +3,9 @@
 #include <wx/control.h>
 #include <wx/menu.h>
 
-#include <algorithm>
-
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/wx_text.h"
-#include "platform/process.h"
 #include "platform/programs.h"
 
 namespace fotomill::desktop {
@@ -16,9 +13,7 @@ namespace fotomill::desktop {
 namespace {
 
 void Open(Shell& shell, const platform::Program& program, const std::vector<std::string>& files) {
-  const auto starts = platform::StartsOf(program, files);
-  const bool started = std::ranges::all_of(
-      starts, [](const std::vector<std::string>& arguments) { return platform::RunProgram(arguments, false); });
+  const bool started = platform::OpenWith(program, files);
   LogEvent("open-with", program.name + (started ? "" : " failed"));
   shell.Report(started ? program.name + " was started." : program.name + " could not be started.");
 }
@@ -28,7 +23,9 @@ void Open(Shell& shell, const platform::Program& program, const std::vector<std:
 wxMenu* NewOpenWithMenu(Shell& shell, const std::vector<std::string>& files) {
   if (files.empty()) return nullptr;
   const std::vector<platform::Program> programs = platform::ProgramsFor(files.front());
-  LogEvent("programs", std::to_string(programs.size()));
+  std::string names;
+  for (const platform::Program& program : programs) names += program.name + ";";
+  LogEvent("programs", names);
   if (programs.empty()) return nullptr;
   auto* menu = new wxMenu;
   for (const platform::Program& program : programs) {
