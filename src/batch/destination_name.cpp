@@ -232,7 +232,7 @@ DestinationAnswer MakeDestinationName(Destination& destination, const std::strin
     answer = AsksAboutCollisions(job) ? AskAboutCollision(destination, source, job, taken, variant, picture)
                                       : SettleUnasked(destination, job.overwrite, job.applyToRest, variant);
   }
-  if (answer == DestinationAnswer::Skip || !job.naming.askPassword || !TakesPassword(row)) return answer;
+  if (answer == DestinationAnswer::Skip || !job.naming.askPassword || !row.takesPassword) return answer;
   const auto password = job.prompts != nullptr ? job.prompts->AskPassword(destination.path) : std::nullopt;
   if (!password) return DestinationAnswer::Skip;
   destination.password = *password;

@@ -6,24 +6,10 @@
 
 namespace fotomill {
 
-namespace {
-
-// Whether `word` is one of the words of a list with blanks between them.
-bool HasWord(std::string_view list, std::string_view word) {
-  while (!list.empty()) {
-    const size_t end = list.find(' ');
-    if (list.substr(0, end) == word) return true;
-    list.remove_prefix(end == std::string_view::npos ? list.size() : end + 1);
-  }
-  return false;
-}
-
-}  // namespace
-
 std::string_view LooksLike(const std::string& fileName, int32_t formatIndex) {
-  const Signature signature = IdentifyFile(fileName);
-  const bool asNamed = formatIndex != kNoFormat && HasWord(signature.extensions, FormatRow(formatIndex).extension.view());
-  return asNamed ? std::string_view() : signature.name;
+  const FileKind kind = IdentifyFile(fileName);
+  const bool asNamed = formatIndex != kNoFormat && kind.IsOf(FormatRow(formatIndex).extension.view());
+  return asNamed ? std::string_view() : kind.name;
 }
 
 std::string OpenHint(const std::string& fileName, Status status) {

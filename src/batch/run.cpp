@@ -34,7 +34,7 @@ std::string FolderOf(const std::string& path) {
 bool AsksEveryName(const BatchJob& job) {
   const FormatEntry& row = FormatRow(job.formatIndex);
   if ((row.flags & FMT_CLIPBOARD) != 0) return true;
-  return job.prompts != nullptr && (job.naming.askName || (job.naming.askPassword && TakesPassword(row)));
+  return job.prompts != nullptr && (job.naming.askName || (job.naming.askPassword && row.takesPassword));
 }
 
 FileOutcome Failure(const BatchFile& file, Status status, std::string hint = {}) {

@@ -6,7 +6,6 @@
 #include "batch/picture_failure.h"
 #include "core/byte_writer.h"
 #include "files/turned_jpeg.h"
-#include "formats/jpeg/jpeg.h"
 #include "metadata/exif/picture_exif.h"
 #include "platform/file_view.h"
 #include "platform/files.h"
@@ -79,7 +78,7 @@ class Turning {
       return Fail(status, OpenHint(source_, status));
     }
     const auto time = request_.keepTime ? platform::ModificationTime(source_) : std::nullopt;
-    RETURN_IF_BAD(FormatRow(picture->formatIndex).read == JpegRead ? TurnAsJpeg() : TurnDecoded(std::move(picture)));
+    RETURN_IF_BAD(FormatRow(picture->formatIndex).turnsWithoutLoss ? TurnAsJpeg() : TurnDecoded(std::move(picture)));
     if (!result_.changed || !time || platform::SetModificationTime(destination_, *time)) return Status::Ok;
     return Fail(Status::ErrorWritingFile, "It was turned, but its time could not be set.");
   }

@@ -207,6 +207,7 @@ int32_t BindPluginFormat(std::string_view fileName) {
   row.info = PluginInfo;
   row.read = PluginRead;
   row.write = PluginWrite;
+  row.canRead = row.canWrite = true;
   row.reserved = 0;
   row.maxBits = entry->flags1;
   row.extension = entry->extension;

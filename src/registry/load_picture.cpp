@@ -59,7 +59,7 @@ Status WritePictureAs(PictureRecord& picture, std::string_view destination, int3
   if (picture.bitsPerPixel > static_cast<int32_t>(row.maxBits)) return Status::TooManyColors;  // flattened palette pictures
   picture.workName = picture.fileName;
   picture.fileName.AssignCut(destination);
-  picture.lostMetadata = KeepsMetadata(row) ? uint8_t{0} : uint8_t{kLostExif | kLostXmp | kLostIcc};
+  picture.lostMetadata = static_cast<uint8_t>(kAllMetadata & ~row.keepsMetadata);
   return row.write(picture, options);
 }
 

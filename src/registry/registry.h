@@ -7,68 +7,12 @@
 #include <vector>
 
 #include "core/status.h"
-#include "picture/animation.h"
 #include "picture/picture_record.h"
-#include "picture/write_options.h"
+#include "registry/format_table.h"
 
 namespace fotomill {
 
-// Capability bits of a format row.
-inline constexpr uint32_t FMT_BITMAP = 0x1;
-inline constexpr uint32_t FMT_RENDERED = 0x2;  // complete after `info`; `read` is never called
-inline constexpr uint32_t FMT_MULTI = 0x4;     // can hold more than one picture
-inline constexpr uint32_t FMT_ANIMATED = 0x8;
-inline constexpr uint32_t FMT_CLIPBOARD = 0x20;  // in no list and never matched by extension
-inline constexpr uint32_t FMT_HIDDEN = 0x40;
-inline constexpr uint32_t FMT_PAGES = 0x100;
-inline constexpr uint32_t FMT_TIMED = 0x200;
-inline constexpr uint32_t FMT_FRAMES = 0x400;
-inline constexpr uint32_t FMT_WALLPAPER = 0x800;
-inline constexpr uint32_t FMT_CONTAINER = 0x1000;
-inline constexpr uint32_t FMT_PNG = 0x2000;
-inline constexpr uint32_t FMT_SOUND = 0x4000;
-inline constexpr uint32_t FMT_LAYERED = 0x8000;
-inline constexpr uint32_t FMT_SECONDARY = 0x10000;  // left out of the destination list
-inline constexpr uint32_t FMT_NO_OPEN = 0x20000;    // left out of the open-file filter
-inline constexpr uint32_t FMT_TRANSPARENT = 0x40000;
-inline constexpr uint32_t FMT_MEDIA = 0x80000;
-inline constexpr uint32_t FMT_MIDI = 0x100000;
-inline constexpr uint32_t FMT_SPARE = 0x200000;  // free slot for a plug-in format
-inline constexpr uint32_t FMT_FLASH = 0x400000;
-inline constexpr uint32_t FMT_ARCHIVE = 0x800000;
-inline constexpr uint32_t FMT_SAVE_ANYWAY = 0x1000000;  // in the destination list whatever else is set
-inline constexpr uint32_t FMT_ALPHA = 0x2000000;        // stores an alpha channel
-
-// Operations of a row. Codecs implement them as plain functions; none of them knows the registry.
-using DetailsOperation = Status (*)(PictureRecord& picture);  // fills `detailLines` of a record that `info` has filled
-using InfoOperation = Status (*)(PictureRecord& picture, const char* fileName, uint32_t flags);
-using ReadOperation = Status (*)(PictureRecord& picture, const char* fileName);
-using WriteOperation = Status (*)(PictureRecord& picture, const WriteOptions& options);  // to picture.fileName
-using AnimateOperation = Status (*)(const char* fileName, AnimationPointer& animation);  // opens a file's frames
-using LifeOperation = int32_t (*)();
-using OptionsOperation = int32_t (*)(void* parentWindow, int32_t parameter);
-
-// One row of the registry.
-struct FormatEntry {
-  DetailsOperation details = nullptr;
-  InfoOperation info = nullptr;
-  ReadOperation read = nullptr;
-  WriteOperation write = nullptr;
-  AnimateOperation animate = nullptr;
-  LifeOperation startup = nullptr;
-  LifeOperation shutdown = nullptr;
-  uint32_t reserved = 0;
-  uint32_t maxBits = 0;                // deepest picture that `write` takes, bits per pixel
-  PathText extension;                  // upper case, without the dot
-  PathText description;                // as shown to the user
-  int32_t enabled = 0;                 // the user's switch, 1 or 0
-  uint32_t flags = 0;                  // FMT_ bits
-  OptionsOperation options = nullptr;  // the row's override dialog, set by the desktop
-};
-
 inline constexpr int32_t kNoFormat = -1;
-inline constexpr int32_t kSpareRow = 77;
-inline constexpr int32_t formatCount = 78;
 
 // Row `index` of the registry; the rows live as long as the program. Only `enabled`, `options` and the spare row change.
 // Every thread has a spare row of its own, so that files of different plug-in formats can be in work at once.
@@ -101,19 +45,15 @@ std::vector<PluginFormatFacts> PluginFormats();
 // How lists show a plug-in format: "(EXT) Plugin", followed by a blank and the module's text when it has one.
 std::string PluginDescription(const PluginFormatFacts& format);
 
-// Whether a row's operations do their work in this build.
+// Whether pictures of a row can be read and written on this machine.
 bool CanRead(const FormatEntry& row);
 bool CanWrite(const FormatEntry& row);
-bool CanTellDetails(const FormatEntry& row);
-bool CanStartUp(const FormatEntry& row);
 // Why a row cannot be read or cannot be written here, in one sentence; empty when both work.
 std::string_view WhyNot(const FormatEntry& row);
 
-// Whether files of the row can hold a picture's EXIF, XMP and color profile. What of them did not fit into one of these
-// files, its writer tells in the record's `lostMetadata`.
-bool KeepsMetadata(const FormatEntry& row);
-// Whether the row's writer protects files by the password of its options.
-bool TakesPassword(const FormatEntry& row);
+// What the codecs of all families have to be set and are built with, in the order of formats/families.def, each once.
+std::vector<const FormatSettings*> SettingsOfFormats();
+std::vector<FormatLibrary> LibrariesOfFormats();
 
 // Call `startup`, or `shutdown`, of every row that has one, in row order.
 void RunFormatStartup();

@@ -1,6 +1,9 @@
 #include "registry/signature.h"
 
+#include <algorithm>
+
 #include "platform/file_view.h"
+#include "registry/registry.h"
 
 namespace fotomill {
 
@@ -8,122 +11,147 @@ namespace {
 
 using namespace std::string_view_literals;
 
-// A second text that must stand further on, where the first alone says too little; the files' containers have one.
-struct SignatureRow {
-  size_t offset;
-  std::string_view bytes;
-  size_t secondOffset;
-  std::string_view second;
+// A signature and the extension of the row that means such files; none for files of kinds that the registry does not have.
+struct SignatureOfRow {
+  std::string_view extension;
   Signature signature;
 };
 
-// The first row that fits wins: brands before their container, long signatures before those of two bytes, which other
-// files may begin with by chance.
+// Signatures of formats that have no codec, and of files that people take for pictures of a format of ours.
 // clang-format off
-constexpr SignatureRow kSignatures[] = {
-    {0, "\x89PNG\r\n\x1a\n"sv,            0, ""sv,     {"PNG", "PNG"}},
-    {0, "\xff\xd8\xff"sv,                 0, ""sv,     {"JPEG", "JPG JFI JFIF JPE JPEG PIC KQP"}},
-    {0, "GIF87a"sv,                       0, ""sv,     {"GIF", "GIF"}},
-    {0, "GIF89a"sv,                       0, ""sv,     {"GIF", "GIF"}},
-    {0, "RIFF"sv,                         8, "WEBP"sv, {"WebP", "WEBP"}},
-    {0, "RIFF"sv,                         8, "AVI "sv, {"AVI", "AVI"}},
-    {0, "RIFF"sv,                         8, "WAVE"sv, {"WAV", "WAV"}},
-    {0, "RIFF"sv,                         8, "ACON"sv, {"an animated cursor", "ANI"}},
-    {0, "RIFF"sv,                         8, "CDR"sv,  {"CorelDRAW", "CDR"}},
-    {4, "ftyp"sv,                         8, "avif"sv, {"AVIF", ""}},
-    {4, "ftyp"sv,                         8, "avis"sv, {"AVIF", ""}},
-    {4, "ftyp"sv,                         8, "heic"sv, {"HEIC", ""}},
-    {4, "ftyp"sv,                         8, "heix"sv, {"HEIC", ""}},
-    {4, "ftyp"sv,                         8, "hevc"sv, {"HEIC", ""}},
-    {4, "ftyp"sv,                         8, "mif1"sv, {"HEIF", ""}},
-    {4, "ftyp"sv,                         8, "msf1"sv, {"HEIF", ""}},
-    {4, "ftyp"sv,                         8, "crx "sv, {"Canon CR3", ""}},
-    {4, "ftyp"sv,                         8, "qt  "sv, {"QuickTime", "MOV"}},
-    {4, "ftyp"sv,                         0, ""sv,     {"MP4", "MP4 M4V MOV MPEG MPG"}},
-    {4, "moov"sv,                         0, ""sv,     {"QuickTime", "MOV"}},
-    {4, "mdat"sv,                         0, ""sv,     {"QuickTime", "MOV"}},
-    {0, "\0\0\0\x0cJXL \r\n\x87\n"sv,     0, ""sv,     {"JPEG XL", ""}},
-    {0, "\0\0\0\x0cjP  \r\n\x87\n"sv,     0, ""sv,     {"JPEG 2000", ""}},
-    {0, "\xff\x4f\xff\x51"sv,             0, ""sv,     {"JPEG 2000", ""}},
-    {0, "II\xbc\x01"sv,                   0, ""sv,     {"JPEG XR", "HDP WDP"}},
-    {0, "II\x2a\0"sv,                     8, "CR"sv,   {"Canon CR2", ""}},
-    {0, "II\x2a\0"sv,                     0, ""sv,     {"TIFF", "TIF KDC"}},
-    {0, "MM\0\x2a"sv,                     0, ""sv,     {"TIFF", "TIF KDC"}},
-    {0, "II\x2b\0"sv,                     0, ""sv,     {"TIFF", "TIF"}},
-    {0, "MM\0\x2b"sv,                     0, ""sv,     {"TIFF", "TIF"}},
-    {0, "8BPS\0\1"sv,                     0, ""sv,     {"Photoshop", "PSD PDD"}},
-    {0, "8BPS\0\2"sv,                     0, ""sv,     {"Photoshop PSB", ""}},
-    {0, "Paint Shop Pro Image File"sv,    0, ""sv,     {"Paint Shop Pro", "PSP"}},
-    {0, "gimp xcf"sv,                     0, ""sv,     {"GIMP XCF", ""}},
-    {0, "SIMPLE  ="sv,                    0, ""sv,     {"FITS", "FIT FTS"}},
-    {0, "FORM"sv,                         8, "ILBM"sv, {"IFF", "IFF LBM HAM"}},
-    {0, "FORM"sv,                         8, "PBM "sv, {"IFF", "IFF LBM HAM"}},
-    {0, "FORM"sv,                         8, "ANIM"sv, {"IFF animation", ""}},
-    {0, "qoif"sv,                         0, ""sv,     {"QOI", ""}},
-    {0, "FLIF"sv,                         0, ""sv,     {"FLIF", ""}},
-    {0, "icns"sv,                         0, ""sv,     {"an Apple icon", ""}},
-    {0, "DDS "sv,                         0, ""sv,     {"DDS", ""}},
-    {0, "\x76\x2f\x31\x01"sv,             0, ""sv,     {"OpenEXR", ""}},
-    {0, "#?RADIANCE"sv,                   0, ""sv,     {"Radiance HDR", ""}},
-    {0, "%PDF-"sv,                        0, ""sv,     {"PDF", ""}},
-    {0, "%!PS"sv,                         0, ""sv,     {"PostScript", "EPS"}},
-    {0, "\xc5\xd0\xd3\xc6"sv,             0, ""sv,     {"EPS", "EPS"}},
-    {0, "\xd0\xcf\x11\xe0\xa1\xb1\x1a\xe1"sv, 0, ""sv, {"a compound file", "FPX"}},
-    {0, "\x59\xa6\x6a\x95"sv,             0, ""sv,     {"Sun raster", "RAS"}},
-    {0, "\xb1\x68\xde\x3a"sv,             0, ""sv,     {"DCX", "DCX"}},
-    {0, "\xffWPC"sv,                      0, ""sv,     {"WordPerfect graphics", "WPG"}},
-    {0, "\xd7\xcd\xc6\x9a"sv,             0, ""sv,     {"WMF", "WMF"}},
-    {0, "\0\0\1\0"sv,                     0, ""sv,     {"an icon", "ICO CUR"}},
-    {0, "\0\0\2\0"sv,                     0, ""sv,     {"a cursor", "CUR ICO"}},
-    {4, "\x11\xaf"sv,                     0, ""sv,     {"FLIC", "FLI FLC"}},
-    {4, "\x12\xaf"sv,                     0, ""sv,     {"FLIC", "FLC FLI"}},
-    {0, "DanM"sv,                         0, ""sv,     {"Microsoft Paint", "MSP"}},
-    {0, "LinS"sv,                         0, ""sv,     {"Microsoft Paint", "MSP"}},
-    {0, "\x07\x20MM"sv,                   0, ""sv,     {"Casio CAM", "CAM"}},
-    {0, "FIF\1"sv,                        0, ""sv,     {"FIF", "FIF"}},
-    {0, "\x1a\x45\xdf\xa3"sv,             0, ""sv,     {"WebM or Matroska", ""}},
-    {0, "\x30\x26\xb2\x75\x8e\x66\xcf\x11"sv, 0, ""sv, {"WMV", "WMV"}},
-    {0, "\0\0\1\xba"sv,                   0, ""sv,     {"MPEG", "MPEG MPG"}},
-    {0, "\0\0\1\xb3"sv,                   0, ""sv,     {"MPEG", "MPEG MPG"}},
-    {0, "OggS"sv,                         0, ""sv,     {"Ogg", ""}},
-    {0, "fLaC"sv,                         0, ""sv,     {"FLAC", ""}},
-    {0, "ID3"sv,                          0, ""sv,     {"MP3", "MP3"}},
-    {0, "MThd"sv,                         0, ""sv,     {"MIDI", "MID"}},
-    {0, "FWS"sv,                          0, ""sv,     {"Flash", "SWF"}},
-    {0, "CWS"sv,                          0, ""sv,     {"Flash", "SWF"}},
-    {0, "PK\3\4"sv,                       0, ""sv,     {"ZIP", "ZIP CDR"}},
-    {0, "Rar!\x1a\x07"sv,                 0, ""sv,     {"RAR", "RAR"}},
-    {0, "7z\xbc\xaf\x27\x1c"sv,           0, ""sv,     {"7-Zip", ""}},
-    {0, "\x1f\x8b\x08"sv,                 0, ""sv,     {"gzip", ""}},
-    {0, "\0\1\0\0\0"sv,                   0, ""sv,     {"TrueType", "TTF OTF"}},
-    {0, "OTTO"sv,                         0, ""sv,     {"OpenType", "OTF TTF"}},
-    {0, "ttcf"sv,                         0, ""sv,     {"a TrueType collection", ""}},
-    {0, "wOFF"sv,                         0, ""sv,     {"a web font", ""}},
-    {0, "wOF2"sv,                         0, ""sv,     {"a web font", ""}},
-    {0, "<svg"sv,                         0, ""sv,     {"SVG", ""}},
-    {0, "<?xml"sv,                        0, ""sv,     {"XML", ""}},
-    {0, "<!DOCTYPE html"sv,               0, ""sv,     {"HTML", ""}},
-    {0, "<!doctype html"sv,               0, ""sv,     {"HTML", ""}},
-    {0, "<html"sv,                        0, ""sv,     {"HTML", ""}},
-    {0, "#define "sv,                     0, ""sv,     {"XBM", "XBM"}},
-    {0, "/* XPM */"sv,                    0, ""sv,     {"XPM", ""}},
-    {0, "begin "sv,                       0, ""sv,     {"UUE", "UUE"}},
-    {0, "P1\n"sv,                         0, ""sv,     {"PBM", ""}},
-    {0, "P2\n"sv,                         0, ""sv,     {"PGM", ""}},
-    {0, "P3\n"sv,                         0, ""sv,     {"PPM", ""}},
-    {0, "P4\n"sv,                         0, ""sv,     {"PBM", ""}},
-    {0, "P5\n"sv,                         0, ""sv,     {"PGM", ""}},
-    {0, "P6\n"sv,                         0, ""sv,     {"PPM", ""}},
-    {0, "P7\n"sv,                         0, ""sv,     {"PAM", ""}},
-    {0, "\xff\x0a"sv,                     0, ""sv,     {"JPEG XL", ""}},
-    {0, "BA"sv,                          14, "BM"sv,   {"an OS/2 bitmap array", "BGA BMP DIB"}},
-    {0, "BM"sv,                           6, "\0\0\0\0"sv, {"BMP", "BMP DIB RLE BGA PIC KQP"}},
-    {0, "MZ"sv,                           0, ""sv,     {"a program", "EXE SCR"}},
-    {0, "\x01\xda"sv,                     0, ""sv,     {"SGI", "SGI RGB"}},
-    {0, "\x0a\5\1"sv,                     0, ""sv,     {"PCX", "PCX"}},
-    {0, "\x34\x12"sv,                     0, ""sv,     {"Pictor", "PIC"}},
+constexpr SignatureOfRow kWithoutCodec[] = {
+    {"PIC",  {0, "\xff\xd8\xff"sv}},
+    {"KQP",  {0, "\xff\xd8\xff"sv}},
+    {"AVI",  {0, "RIFF"sv, "AVI", 8, "AVI "sv}},
+    {"WAV",  {0, "RIFF"sv, "WAV", 8, "WAVE"sv}},
+    {"ANI",  {0, "RIFF"sv, "an animated cursor", 8, "ACON"sv}},
+    {"CDR",  {0, "RIFF"sv, "CorelDRAW", 8, "CDR"sv}},
+    {"",     {4, "ftyp"sv, "AVIF", 8, "avif"sv}},
+    {"",     {4, "ftyp"sv, "AVIF", 8, "avis"sv}},
+    {"",     {4, "ftyp"sv, "HEIC", 8, "heic"sv}},
+    {"",     {4, "ftyp"sv, "HEIC", 8, "heix"sv}},
+    {"",     {4, "ftyp"sv, "HEIC", 8, "hevc"sv}},
+    {"",     {4, "ftyp"sv, "HEIF", 8, "mif1"sv}},
+    {"",     {4, "ftyp"sv, "HEIF", 8, "msf1"sv}},
+    {"",     {4, "ftyp"sv, "Canon CR3", 8, "crx "sv}},
+    {"MOV",  {4, "ftyp"sv, "QuickTime", 8, "qt  "sv}},
+    {"MP4",  {4, "ftyp"sv, "MP4"}},
+    {"M4V",  {4, "ftyp"sv}},
+    {"MOV",  {4, "ftyp"sv}},
+    {"MPEG", {4, "ftyp"sv}},
+    {"MPG",  {4, "ftyp"sv}},
+    {"MOV",  {4, "moov"sv, "QuickTime"}},
+    {"MOV",  {4, "mdat"sv, "QuickTime"}},
+    {"",     {0, "\0\0\0\x0cJXL \r\n\x87\n"sv, "JPEG XL"}},
+    {"",     {0, "\0\0\0\x0cjP  \r\n\x87\n"sv, "JPEG 2000"}},
+    {"",     {0, "\xff\x4f\xff\x51"sv, "JPEG 2000"}},
+    {"",     {0, "II\x2a\0"sv, "Canon CR2", 8, "CR"sv}},
+    {"KDC",  {0, "II\x2a\0"sv}},
+    {"KDC",  {0, "MM\0\x2a"sv}},
+    {"PSD",  {0, "8BPS\0\1"sv, "Photoshop"}},
+    {"PDD",  {0, "8BPS\0\1"sv}},
+    {"",     {0, "8BPS\0\2"sv, "Photoshop PSB"}},
+    {"PSP",  {0, "Paint Shop Pro Image File"sv, "Paint Shop Pro"}},
+    {"",     {0, "gimp xcf"sv, "GIMP XCF"}},
+    {"IFF",  {0, "FORM"sv, "IFF", 8, "ILBM"sv}},
+    {"LBM",  {0, "FORM"sv, {}, 8, "ILBM"sv}},
+    {"HAM",  {0, "FORM"sv, {}, 8, "ILBM"sv}},
+    {"IFF",  {0, "FORM"sv, "IFF", 8, "PBM "sv}},
+    {"LBM",  {0, "FORM"sv, {}, 8, "PBM "sv}},
+    {"HAM",  {0, "FORM"sv, {}, 8, "PBM "sv}},
+    {"",     {0, "FORM"sv, "IFF animation", 8, "ANIM"sv}},
+    {"",     {0, "qoif"sv, "QOI"}},
+    {"",     {0, "FLIF"sv, "FLIF"}},
+    {"",     {0, "icns"sv, "an Apple icon"}},
+    {"",     {0, "DDS "sv, "DDS"}},
+    {"",     {0, "\x76\x2f\x31\x01"sv, "OpenEXR"}},
+    {"",     {0, "#?RADIANCE"sv, "Radiance HDR"}},
+    {"",     {0, "%PDF-"sv, "PDF"}},
+    {"EPS",  {0, "%!PS"sv, "PostScript"}},
+    {"EPS",  {0, "\xc5\xd0\xd3\xc6"sv, "EPS"}},
+    {"FPX",  {0, "\xd0\xcf\x11\xe0\xa1\xb1\x1a\xe1"sv, "a compound file"}},
+    {"RAS",  {0, "\x59\xa6\x6a\x95"sv, "Sun raster"}},
+    {"DCX",  {0, "\xb1\x68\xde\x3a"sv, "DCX"}},
+    {"WPG",  {0, "\xffWPC"sv, "WordPerfect graphics"}},
+    {"WMF",  {0, "\xd7\xcd\xc6\x9a"sv, "WMF"}},
+    {"FLI",  {4, "\x11\xaf"sv, "FLIC"}},
+    {"FLC",  {4, "\x11\xaf"sv}},
+    {"FLC",  {4, "\x12\xaf"sv, "FLIC"}},
+    {"FLI",  {4, "\x12\xaf"sv}},
+    {"MSP",  {0, "DanM"sv, "Microsoft Paint"}},
+    {"MSP",  {0, "LinS"sv, "Microsoft Paint"}},
+    {"CAM",  {0, "\x07\x20MM"sv, "Casio CAM"}},
+    {"FIF",  {0, "FIF\1"sv, "FIF"}},
+    {"",     {0, "\x1a\x45\xdf\xa3"sv, "WebM or Matroska"}},
+    {"WMV",  {0, "\x30\x26\xb2\x75\x8e\x66\xcf\x11"sv, "WMV"}},
+    {"MPEG", {0, "\0\0\1\xba"sv, "MPEG"}},
+    {"MPG",  {0, "\0\0\1\xba"sv}},
+    {"MPEG", {0, "\0\0\1\xb3"sv, "MPEG"}},
+    {"MPG",  {0, "\0\0\1\xb3"sv}},
+    {"",     {0, "OggS"sv, "Ogg"}},
+    {"",     {0, "fLaC"sv, "FLAC"}},
+    {"MP3",  {0, "ID3"sv, "MP3"}},
+    {"MID",  {0, "MThd"sv, "MIDI"}},
+    {"SWF",  {0, "FWS"sv, "Flash"}},
+    {"SWF",  {0, "CWS"sv, "Flash"}},
+    {"ZIP",  {0, "PK\3\4"sv, "ZIP"}},
+    {"CDR",  {0, "PK\3\4"sv}},
+    {"RAR",  {0, "Rar!\x1a\x07"sv, "RAR"}},
+    {"",     {0, "7z\xbc\xaf\x27\x1c"sv, "7-Zip"}},
+    {"",     {0, "\x1f\x8b\x08"sv, "gzip"}},
+    {"TTF",  {0, "\0\1\0\0\0"sv, "TrueType"}},
+    {"OTF",  {0, "\0\1\0\0\0"sv}},
+    {"OTF",  {0, "OTTO"sv, "OpenType"}},
+    {"TTF",  {0, "OTTO"sv}},
+    {"",     {0, "ttcf"sv, "a TrueType collection"}},
+    {"",     {0, "wOFF"sv, "a web font"}},
+    {"",     {0, "wOF2"sv, "a web font"}},
+    {"",     {0, "<svg"sv, "SVG"}},
+    {"",     {0, "<?xml"sv, "XML"}},
+    {"",     {0, "<!DOCTYPE html"sv, "HTML"}},
+    {"",     {0, "<!doctype html"sv, "HTML"}},
+    {"",     {0, "<html"sv, "HTML"}},
+    {"",     {0, "/* XPM */"sv, "XPM"}},
+    {"UUE",  {0, "begin "sv, "UUE"}},
+    {"",     {0, "P1\n"sv, "PBM"}},
+    {"",     {0, "P2\n"sv, "PGM"}},
+    {"",     {0, "P3\n"sv, "PPM"}},
+    {"",     {0, "P4\n"sv, "PBM"}},
+    {"",     {0, "P5\n"sv, "PGM"}},
+    {"",     {0, "P6\n"sv, "PPM"}},
+    {"",     {0, "P7\n"sv, "PAM"}},
+    {"",     {0, "\xff\x0a"sv, "JPEG XL"}},
+    {"BGA",  {0, "BA"sv, "an OS/2 bitmap array", 14, "BM"sv}},
+    {"RLE",  {0, "BM"sv, {}, 6, "\0\0\0\0"sv}},
+    {"BGA",  {0, "BM"sv, {}, 6, "\0\0\0\0"sv}},
+    {"PIC",  {0, "BM"sv, {}, 6, "\0\0\0\0"sv}},
+    {"KQP",  {0, "BM"sv, {}, 6, "\0\0\0\0"sv}},
+    {"EXE",  {0, "MZ"sv, "a program"}},
+    {"SCR",  {0, "MZ"sv}},
+    {"SGI",  {0, "\x01\xda"sv, "SGI"}},
+    {"RGB",  {0, "\x01\xda"sv}},
+    {"PIC",  {0, "\x34\x12"sv, "Pictor"}},
 };
 // clang-format on
+
+size_t Length(const Signature& signature) { return signature.bytes.size() + signature.second.size(); }
+
+// Long signatures before those of a few bytes, which other files may begin with by chance; of equal ones first the format
+// that gives the name.
+std::vector<SignatureOfRow> AllSignatures() {
+  std::vector<SignatureOfRow> all;
+  for (const std::span<const FormatEntry> family : FormatFamilies()) {
+    for (const FormatEntry& row : family) {
+      for (const Signature& signature : row.signatures) all.push_back({row.extension, signature});
+    }
+  }
+  all.insert(all.end(), std::begin(kWithoutCodec), std::end(kWithoutCodec));
+  std::ranges::stable_sort(all, [](const SignatureOfRow& a, const SignatureOfRow& b) {
+    if (Length(a.signature) != Length(b.signature)) return Length(a.signature) > Length(b.signature);
+    return !a.signature.name.empty() && b.signature.name.empty();
+  });
+  return all;
+}
 
 bool StandsAt(std::span<const uint8_t> head, size_t offset, std::string_view text) {
   if (offset + text.size() > head.size()) return false;
@@ -133,16 +161,29 @@ bool StandsAt(std::span<const uint8_t> head, size_t offset, std::string_view tex
   return true;
 }
 
-}  // namespace
-
-Signature IdentifySignature(std::span<const uint8_t> head) {
-  for (const SignatureRow& row : kSignatures) {
-    if (StandsAt(head, row.offset, row.bytes) && StandsAt(head, row.secondOffset, row.second)) return row.signature;
-  }
-  return {};
+bool Fits(std::span<const uint8_t> head, const Signature& signature) {
+  return StandsAt(head, signature.offset, signature.bytes) && StandsAt(head, signature.secondOffset, signature.second);
 }
 
-Signature IdentifyFile(const std::string& fileName) {
+}  // namespace
+
+bool FileKind::IsOf(std::string_view extension) const { return std::ranges::find(extensions, extension) != extensions.end(); }
+
+FileKind IdentifySignature(std::span<const uint8_t> head) {
+  static const std::vector<SignatureOfRow> all = AllSignatures();
+  FileKind kind;
+  size_t length = 0;
+  for (const auto& [extension, signature] : all) {
+    if (length > Length(signature)) break;
+    if (!Fits(head, signature)) continue;
+    if (length == 0) kind.name = signature.name;
+    length = Length(signature);
+    if (!extension.empty()) kind.extensions.push_back(extension);
+  }
+  return kind;
+}
+
+FileKind IdentifyFile(const std::string& fileName) {
   platform::FileView file;
   if (!file.OpenHead(fileName.c_str(), kSignatureBytes)) return {};
   return IdentifySignature(file.Bytes());

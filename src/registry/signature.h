@@ -5,20 +5,22 @@
 #include <span>
 #include <string>
 #include <string_view>
+#include <vector>
 
 namespace fotomill {
 
 // What a file's first bytes say that it is, whatever its name.
-struct Signature {
-  std::string_view name;        // as people call the format: "AVIF"
-  std::string_view extensions;  // rows of the registry that mean such files: "JPG JPEG"; empty when none does
+struct FileKind {
+  std::string_view name;                     // as people call the format: "AVIF"; empty when nothing fits
+  std::vector<std::string_view> extensions;  // of the registry's rows that mean such files, the likeliest first
+  bool IsOf(std::string_view extension) const;
 };
 
 inline constexpr size_t kSignatureBytes = 32;
 
-// Recognises a file by its first kSignatureBytes bytes (fewer when it is shorter). The name is empty when nothing fits.
-Signature IdentifySignature(std::span<const uint8_t> head);
+// Recognises a file by its first kSignatureBytes bytes (fewer when it is shorter), by the longest signature that fits.
+FileKind IdentifySignature(std::span<const uint8_t> head);
 // The same for a file; nothing fits when it cannot be opened.
-Signature IdentifyFile(const std::string& fileName);
+FileKind IdentifyFile(const std::string& fileName);
 
 }  // namespace fotomill

@@ -90,10 +90,10 @@ TEST(SetupHelp, EntriesArePlainTextAndEndWhereTheNextBegins) {
 }
 
 TEST(OverrideOptions, BelongToFormatsThatAreWritten) {
-  for (const OverrideOptions& options : AllOverrideOptions()) {
-    SCOPED_TRACE(options.box);
-    EXPECT_EQ(FindOverrideOptions(options.extension), &options);
-    EXPECT_EQ(ItemsOf(options).size(), options.keys.size()) << "every option is a row of Setup";
+  for (const FormatSettings* const options : SettingsOfFormats()) {
+    SCOPED_TRACE(options->box);
+    EXPECT_EQ(FindOverrideOptions(options->extension), options);
+    EXPECT_EQ(ItemsOf(*options).size(), options->keys.size()) << "every option is a row of Setup";
   }
   EXPECT_STREQ(FindOverrideOptions("jpeg")->box, "OverrideJpgBox") << "another row of the same codec";
   EXPECT_STREQ(FindOverrideOptions("Dib")->box, "OverrideBmpBox");

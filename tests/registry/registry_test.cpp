@@ -3,6 +3,11 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <ranges>
+#include <set>
+
+#include "settings/key_table.h"
 #include "settings/settings.h"
 #include "support/files.h"
 #include "support/pictures.h"
@@ -213,6 +218,29 @@ TEST(Registry, RowsKeepTheirPromises) {
     EXPECT_EQ((row.flags & FMT_SECONDARY) != 0, i >= 41);
     EXPECT_EQ((row.flags & FMT_MULTI) != 0, (row.flags & FMT_PAGES) != 0 || i == 0 || i == 36 || i == 41 || i == 48 || i == 49);
     EXPECT_EQ(CanRead(row) && CanWrite(row), WhyNot(row).empty());
+    EXPECT_TRUE(row.present == nullptr || !row.whyNot.empty()) << "nothing says what is missing";
+    EXPECT_FALSE(row.description.empty()) << row.extension.view() << " has neither a codec nor facts in the table";
+  }
+}
+
+TEST(Registry, HoldsEveryRowOfTheFamilies) {
+  std::set<std::string_view> seen;
+  for (const std::span<const FormatEntry> family : FormatFamilies()) {
+    EXPECT_FALSE(family.empty());
+    for (const FormatEntry& row : family) {
+      SCOPED_TRACE(row.extension.view());
+      EXPECT_TRUE(seen.insert(row.extension.view()).second) << "two families have this row";
+      const auto same = [&](int32_t index) {
+        return FormatRow(index).info == row.info && FormatRow(index).extension.view() == row.extension.view();
+      };
+      EXPECT_TRUE(std::ranges::any_of(std::views::iota(0, formatCount), same)) << "the registry has no place for it";
+    }
+  }
+}
+
+TEST(Registry, SettingsOfFormatsAreKeys) {
+  for (const FormatSettings* const codec : SettingsOfFormats()) {
+    for (const FormatSetting& setting : codec->keys) EXPECT_NE(FindKey(setting.key), nullptr) << setting.key;
   }
 }
 

@@ -28,9 +28,9 @@ Json RowAsJson(int32_t index) {
   element["enabled"] = row.enabled != 0;
   element["flags"] = row.flags;
   element["maxBits"] = row.maxBits;
-  element["details"] = CanTellDetails(row);
+  element["details"] = row.details != nullptr;
   element["options"] = row.options != nullptr;
-  element["startup"] = CanStartUp(row);
+  element["startup"] = row.canStartUp;
   element["read"] = CanRead(row);
   element["write"] = CanWrite(row);
   if (const std::string_view reason = WhyNot(row); !reason.empty()) element["reason"] = reason;

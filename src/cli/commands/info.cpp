@@ -89,7 +89,7 @@ Status GatherFacts(const SelectedFile& file, PicturePointer& picture) {
   if (file.status != Status::Ok) return file.status;
   RETURN_IF_BAD(LoadPictureInfo(file.name.c_str(), picture));
   const FormatEntry& row = FormatRow(picture->formatIndex);
-  if (CanTellDetails(row)) RETURN_IF_BAD(row.details(*picture));
+  if (row.details != nullptr) RETURN_IF_BAD(row.details(*picture));
   return Status::Ok;
 }
 

@@ -178,7 +178,7 @@ FileInfo ReadFileInfo(const std::string& path, const InfoOptions& options) {
   if (info.status == Status::Ok) {
     AddPictureFacts(*picture, options, info, general);
     const FormatEntry& row = FormatRow(picture->formatIndex);
-    if (CanTellDetails(row)) info.status = row.details(*picture);
+    if (row.details != nullptr) info.status = row.details(*picture);
   }
   if (info.status != Status::Ok) info.problem = ProblemOf(path, info.status);
   info.sections.push_back(std::move(general));

@@ -6,40 +6,16 @@
 
 namespace fotomill::desktop {
 
-const std::vector<OverrideOptions>& AllOverrideOptions() {
-  using enum KeyNumber;
-  // clang-format off
-  static const std::vector<OverrideOptions> options = {
-      {"BMP",  "OverrideBmpBox",  {WriteOS2Bitmaps}},
-      {"GIF",  "OverrideGifBox",  {WriteGIFInterlaced, CreateGif89, FXColorDither, FXBidirectional}},
-      {"HDP",  "OverrideHdpBox",  {HDPCompression, TiffResolution}},
-      {"ICO",  "OverrideIcoBox",  {ICOCompression}},
-      {"JPG",  "OverrideJpgBox",  {JpegCompression, JpegSubsample, WriteJpegProgressive, JpegStoreDPI, TiffResolution,
-                                   AlphaBackground}},
-      {"MAC",  "OverrideMacBox",  {CreateMacbinaryHeader, FXMonoDither, FXThreshold}},
-      {"PNG",  "OverridePngBox",  {PngCompression}},
-      {"TGA",  "OverrideTgaBox",  {CreateTarga16}},
-      {"TIF",  "OverrideTifBox",  {TiffOptions, TiffResolution, JpegCompression}},
-      {"WEBP", "OverrideWebPBox", {WebPLossless, WebPQualityFactor, WebPAllowMixed}},
-  };
-  // clang-format on
-  return options;
+const FormatSettings* FindOverrideOptions(std::string_view extension) {
+  const int32_t row = FindFormatByName("a." + std::string(extension));
+  return row == kNoFormat || !CanWrite(FormatRow(row)) ? nullptr : FormatRow(row).settings;
 }
 
-const OverrideOptions* FindOverrideOptions(std::string_view extension) {
-  const int32_t wanted = FindFormatByName("a." + std::string(extension));
-  if (wanted == kNoFormat || !CanWrite(FormatRow(wanted))) return nullptr;
-  for (const OverrideOptions& options : AllOverrideOptions()) {
-    const int32_t row = FindFormatByName(std::string("a.") + options.extension);
-    if (row != kNoFormat && FormatRow(row).write == FormatRow(wanted).write) return &options;
-  }
-  return nullptr;
-}
-
-std::vector<SetupItem> ItemsOf(const OverrideOptions& options) {
+std::vector<SetupItem> ItemsOf(const FormatSettings& options) {
   std::vector<SetupItem> items;
-  for (const KeyNumber key : options.keys) {
-    const auto found = std::ranges::find(SetupItems(), key, &SetupItem::key);
+  for (const FormatSetting& setting : options.keys) {
+    const auto named = [&](const SetupItem& item) { return KeyOf(item.key).name == setting.key; };
+    const auto found = std::ranges::find_if(SetupItems(), named);
     if (found != SetupItems().end()) items.push_back(*found);
   }
   return items;

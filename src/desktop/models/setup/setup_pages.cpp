@@ -6,6 +6,7 @@
 
 #include "core/text.h"
 #include "desktop/models/setup/setup_help.h"
+#include "registry/registry.h"
 
 namespace fotomill::desktop {
 
@@ -76,22 +77,6 @@ constexpr SetupItem kItems[] = {
     {Saving,     "New files",          PasswordProtect,                "Protect files with a password where the format can"},
     {Saving,     "New files",          TiffResolution,                 "Resolution of pictures that have none (dots per inch)"},
     {Saving,     "New files",          AlphaBackground,                "Color behind transparency that a format cannot hold"},
-    {Saving,     "JPEG",               JpegCompression,                "Quality"},
-    {Saving,     "JPEG",               JpegSubsample,                  "Share colors of neighbors"},
-    {Saving,     "JPEG",               WriteJpegProgressive,           "Progressive"},
-    {Saving,     "JPEG",               JpegStoreDPI,                   "Store the resolution"},
-    {Saving,     "PNG",                PngCompression,                 "Compression, 0 fastest to 9 smallest"},
-    {Saving,     "TIFF",               TiffOptions,                    "Compression"},
-    {Saving,     "WebP",               WebPLossless,                   "Lose nothing"},
-    {Saving,     "WebP",               WebPQualityFactor,              "Quality"},
-    {Saving,     "WebP",               WebPAllowMixed,                 "Try both ways and keep the smaller file"},
-    {Saving,     "HD Photo",           HDPCompression,                 "Compression, 0 loses nothing to 255 smallest"},
-    {Saving,     "GIF",                WriteGIFInterlaced,             "Interlaced"},
-    {Saving,     "GIF",                CreateGif89,                    "Version 89a, with comments and transparency"},
-    {Saving,     "Other formats",      ICOCompression,                 "Icons (ICO): compression"},
-    {Saving,     "Other formats",      WriteOS2Bitmaps,                "Bitmaps (BMP): write the OS/2 form"},
-    {Saving,     "Other formats",      CreateTarga16,                  "Targa (TGA): 16 bits a pixel"},
-    {Saving,     "Other formats",      CreateMacbinaryHeader,          "MacPaint (MAC): put a MacBinary header in front"},
     {Names,      "Where",              DestForceSourceDir,             "Write next to the source file"},
     {Names,      "Names",              PromptForDestName,              "Ask for the name of every file"},
     {Names,      "Names",              ExtensionCaseStyle,             "Letters of extensions"},
@@ -149,6 +134,20 @@ consteval bool EveryItemIsShownOnce() {
 }
 static_assert(EveryItemIsShownOnce());
 
+// The rows above, and at the end of the page Saving those that the formats have themselves.
+std::vector<SetupItem> WithSettingsOfFormats() {
+  std::vector<SetupItem> items(std::begin(kItems), std::end(kItems));
+  auto place = std::ranges::find_if(items, [](const SetupItem& item) { return item.page > Saving; });
+  for (const FormatSettings* const codec : SettingsOfFormats()) {
+    for (const FormatSetting& setting : codec->keys) {
+      const KeyRow* const row = FindKey(setting.key);
+      if (row == nullptr || *setting.label == '\0') continue;
+      place = items.insert(place, {Saving, codec->group, static_cast<KeyNumber>(NumberOfKey(*row)), setting.label}) + 1;
+    }
+  }
+  return items;
+}
+
 std::string SearchedText(const SetupItem& item) {
   const char* const name = KeyOf(item.key).name;
   std::string text = std::string(TitleOf(item.page)) + " " + item.group + " " + item.label + " " + name;
@@ -159,11 +158,14 @@ std::string SearchedText(const SetupItem& item) {
 
 const char* TitleOf(SetupPage page) { return kTitles[static_cast<size_t>(page)]; }
 
-std::span<const SetupItem> SetupItems() { return kItems; }
+std::span<const SetupItem> SetupItems() {
+  static const std::vector<SetupItem> items = WithSettingsOfFormats();
+  return items;
+}
 
 std::vector<SetupItem> ItemsOf(SetupPage page) {
   std::vector<SetupItem> items;
-  std::ranges::copy_if(kItems, std::back_inserter(items), [&](const SetupItem& item) { return item.page == page; });
+  std::ranges::copy_if(SetupItems(), std::back_inserter(items), [&](const SetupItem& item) { return item.page == page; });
   return items;
 }
 
@@ -171,7 +173,7 @@ std::vector<SetupItem> FindSettings(std::string_view words) {
   const std::string wanted = LowerCase(words);
   std::vector<SetupItem> found;
   if (wanted.find_first_not_of(' ') == std::string::npos) return found;
-  for (const SetupItem& item : kItems) {
+  for (const SetupItem& item : SetupItems()) {
     const std::string text = SearchedText(item);
     bool all = true;
     for (size_t end = 0, start = wanted.find_first_not_of(' '); start != std::string::npos;

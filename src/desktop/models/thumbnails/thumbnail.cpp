@@ -182,7 +182,7 @@ ThumbnailPointer LoadThumbnail(const ThumbnailWish& wish) {
   return thumbnail;
 }
 
-bool MayHoldThumbnail(int32_t format) { return format != kNoFormat && KeepsMetadata(FormatRow(format)); }
+bool MayHoldThumbnail(int32_t format) { return format != kNoFormat && FormatRow(format).keepsMetadata != 0; }
 
 void KeepThumbnailRecords() { openDatabase.Flush(); }
 

@@ -10,28 +10,17 @@ namespace fotomill::desktop {
 
 namespace {
 
-// The boxes of rows whose table entry has one. The rest of the formats with options reach theirs by ShowOverrideBox.
-template <size_t index>
-int32_t RowOptions(void* parentWindow, int32_t) {
-  static constexpr const char* kExtensions[] = {"HDP", "ICO", "JPG", "PNG", "TIF", "WEBP"};
-  return ShowOverrideBox(static_cast<wxWindow*>(parentWindow), kExtensions[index]) ? 1 : 0;
+// The operation `options` of the rows that have one; `parameter` is the row's index.
+int32_t RowOptions(void* parentWindow, int32_t parameter) {
+  return ShowOverrideBox(static_cast<wxWindow*>(parentWindow), FormatRow(parameter).extension.view()) ? 1 : 0;
 }
-
-struct RowBox {
-  const char* extension;
-  OptionsOperation options;
-};
-constexpr RowBox kRowBoxes[] = {
-    {"HDP", RowOptions<0>}, {"ICO", RowOptions<1>}, {"JPG", RowOptions<2>},
-    {"PNG", RowOptions<3>}, {"TIF", RowOptions<4>}, {"WEBP", RowOptions<5>},
-};
 
 }  // namespace
 
 bool HasOverrideBox(std::string_view extension) { return FindOverrideOptions(extension) != nullptr; }
 
 bool ShowOverrideBox(wxWindow* parent, std::string_view extension) {
-  const OverrideOptions* const options = FindOverrideOptions(extension);
+  const FormatSettings* const options = FindOverrideOptions(extension);
   if (options == nullptr) return false;
   return ShowSettingsBox(parent, wxString(options->extension) + " options", options->box, ItemsOf(*options));
 }
@@ -39,10 +28,9 @@ bool ShowOverrideBox(wxWindow* parent, std::string_view extension) {
 bool ShiftOpensOverrideBox() { return settings.AllowDestinationOverrides != 0; }
 
 void InstallOverrideBoxes() {
-  for (const RowBox& box : kRowBoxes) {
-    if (!HasOverrideBox(box.extension)) continue;
-    const int32_t row = FindFormatByName(std::string("a.") + box.extension);
-    if (row != kNoFormat) FormatRow(row).options = box.options;
+  for (int32_t index = 0; index < formatCount; ++index) {
+    FormatEntry& row = FormatRow(index);
+    if (row.hasOptionsBox && HasOverrideBox(row.extension.view())) row.options = RowOptions;
   }
 }
 

@@ -1,0 +1,121 @@
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <span>
+#include <string>
+#include <string_view>
+
+#include "core/fixed_text.h"
+#include "core/status.h"
+#include "picture/animation.h"
+#include "picture/picture_record.h"
+#include "picture/write_options.h"
+
+namespace fotomill {
+
+// Capability bits of a format row.
+inline constexpr uint32_t FMT_BITMAP = 0x1;
+inline constexpr uint32_t FMT_RENDERED = 0x2;  // complete after `info`; `read` is never called
+inline constexpr uint32_t FMT_MULTI = 0x4;     // can hold more than one picture
+inline constexpr uint32_t FMT_ANIMATED = 0x8;
+inline constexpr uint32_t FMT_CLIPBOARD = 0x20;  // in no list and never matched by extension
+inline constexpr uint32_t FMT_HIDDEN = 0x40;
+inline constexpr uint32_t FMT_PAGES = 0x100;
+inline constexpr uint32_t FMT_TIMED = 0x200;
+inline constexpr uint32_t FMT_FRAMES = 0x400;
+inline constexpr uint32_t FMT_WALLPAPER = 0x800;
+inline constexpr uint32_t FMT_CONTAINER = 0x1000;
+inline constexpr uint32_t FMT_PNG = 0x2000;
+inline constexpr uint32_t FMT_SOUND = 0x4000;
+inline constexpr uint32_t FMT_LAYERED = 0x8000;
+inline constexpr uint32_t FMT_SECONDARY = 0x10000;  // left out of the destination list
+inline constexpr uint32_t FMT_NO_OPEN = 0x20000;    // left out of the open-file filter
+inline constexpr uint32_t FMT_TRANSPARENT = 0x40000;
+inline constexpr uint32_t FMT_MEDIA = 0x80000;
+inline constexpr uint32_t FMT_MIDI = 0x100000;
+inline constexpr uint32_t FMT_SPARE = 0x200000;  // free slot for a plug-in format
+inline constexpr uint32_t FMT_FLASH = 0x400000;
+inline constexpr uint32_t FMT_ARCHIVE = 0x800000;
+inline constexpr uint32_t FMT_SAVE_ANYWAY = 0x1000000;  // in the destination list whatever else is set
+inline constexpr uint32_t FMT_ALPHA = 0x2000000;        // stores an alpha channel
+
+// Operations of a row. Codecs implement them as plain functions; none of them knows the registry.
+using DetailsOperation = Status (*)(PictureRecord& picture);  // fills `detailLines` of a record that `info` has filled
+using InfoOperation = Status (*)(PictureRecord& picture, const char* fileName, uint32_t flags);
+using ReadOperation = Status (*)(PictureRecord& picture, const char* fileName);
+using WriteOperation = Status (*)(PictureRecord& picture, const WriteOptions& options);  // to picture.fileName
+using AnimateOperation = Status (*)(const char* fileName, AnimationPointer& animation);  // opens a file's frames
+using LifeOperation = int32_t (*)();
+using OptionsOperation = int32_t (*)(void* parentWindow, int32_t parameter);
+
+// What files of a format begin with: one text, and where that says too little a second one further on.
+struct Signature {
+  size_t offset = 0;
+  std::string_view bytes = {};
+  std::string_view name =
+      {};  // what such a file is, as people say: "TIFF", "an icon". Empty: another format is better known for it
+  size_t secondOffset = 0;
+  std::string_view second = {};
+};
+
+// A key of the configuration that matters to a codec.
+struct FormatSetting {
+  std::string_view key = {};  // "JpegCompression"
+  const char* label = "";     // of its control in Setup; empty for a key that Setup shows elsewhere
+};
+
+// The settings of a codec. Setup shows those with a label under one heading; the format's own box shows all.
+struct FormatSettings {
+  const char* extension;  // names the format in the box's title
+  const char* box;        // the box's name, "OverrideJpgBox"
+  const char* group;      // the heading in Setup
+  std::span<const FormatSetting> keys = {};
+};
+
+// A library that a codec uses.
+struct FormatLibrary {
+  const char* name;
+  std::string (*version)();
+  const char* purpose;  // the formats that it serves
+};
+
+// Everything that `keepsMetadata` can say; the bits are those of PictureRecord::lostMetadata.
+inline constexpr uint8_t kAllMetadata = kLostExif | kLostXmp | kLostIcc;
+
+// What a row says when its files can be read but not written.
+inline constexpr std::string_view kOnlyRead = "Files of this format can only be read.";
+
+// One row of the registry: everything that the program knows about a format. A family of codecs has its rows in
+// formats/FAMILY/rows.cpp.
+struct FormatEntry {
+  DetailsOperation details = nullptr;
+  InfoOperation info = nullptr;
+  ReadOperation read = nullptr;
+  WriteOperation write = nullptr;
+  LifeOperation startup = nullptr;
+  LifeOperation shutdown = nullptr;
+  uint32_t reserved = 0;
+  uint32_t maxBits = 0;                // deepest picture that `write` takes, bits per pixel
+  PathText extension = {};             // upper case, without the dot
+  PathText description = {};           // as shown to the user
+  int32_t enabled = 0;                 // the user's switch, 1 or 0
+  uint32_t flags = 0;                  // FMT_ bits
+  OptionsOperation options = nullptr;  // the row's override dialog, set by the desktop
+
+  AnimateOperation animate = nullptr;
+  bool canRead = false;          // `info` and `read` do their work in this build
+  bool canWrite = false;         // so does `write`
+  bool canStartUp = false;       // so does `startup`
+  bool (*present)() = nullptr;   // whether what the codec loads when it is needed is on this machine; null: nothing is
+  std::string_view whyNot = {};  // why the row cannot be read or cannot be written, in one sentence
+  std::span<const Signature> signatures = {};
+  uint8_t keepsMetadata = 0;                 // kLost bits: what its files can hold, and so does not get lost
+  bool turnsWithoutLoss = false;             // JPEG files, which are turned without being decoded
+  bool takesPassword = false;                // `write` protects files by the password of its options
+  bool hasOptionsBox = false;                // the row gets `options`
+  const FormatSettings* settings = nullptr;  // shared by the rows of one codec; null: none
+  std::span<const FormatLibrary> libraries = {};
+};
+
+}  // namespace fotomill

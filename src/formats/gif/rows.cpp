@@ -1,0 +1,42 @@
+#include "formats/rows.h"
+
+#include "formats/gif/gif.h"
+
+namespace fotomill {
+
+namespace {
+
+using namespace std::string_view_literals;
+
+constexpr Signature kSignatures[] = {{0, "GIF87a"sv, "GIF"}, {0, "GIF89a"sv, "GIF"}};
+
+constexpr FormatSetting kKeys[] = {
+    {"WriteGIFInterlaced", "Interlaced"},
+    {"CreateGif89", "Version 89a, with comments and transparency"},
+    {"FXColorDither"},
+    {"FXBidirectional"},
+};
+constexpr FormatSettings kSettings = {"GIF", "OverrideGifBox", "GIF", kKeys};
+
+constexpr FormatEntry kRows[] = {{
+    .details = GifDetails,
+    .info = GifInfo,
+    .read = GifRead,
+    .write = GifWrite,
+    .maxBits = 8,
+    .extension = "GIF"sv,
+    .description = "(GIF) CompuServe"sv,
+    .enabled = 1,
+    .flags = FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_PAGES | FMT_TIMED | FMT_FRAMES | FMT_LAYERED | FMT_TRANSPARENT,
+    .animate = GifAnimate,
+    .canRead = true,
+    .canWrite = true,
+    .signatures = kSignatures,
+    .settings = &kSettings,
+}};
+
+}  // namespace
+
+std::span<const FormatEntry> GifRows() { return kRows; }
+
+}  // namespace fotomill

@@ -1,0 +1,32 @@
+#include "formats/rows.h"
+
+#include "formats/targa/tga.h"
+
+namespace fotomill {
+
+namespace {
+
+using namespace std::string_view_literals;
+
+constexpr FormatSetting kKeys[] = {{"CreateTarga16", "Targa (TGA): 16 bits a pixel"}};
+constexpr FormatSettings kSettings = {"TGA", "OverrideTgaBox", "Other formats", kKeys};
+
+constexpr FormatEntry kRows[] = {{
+    .info = TgaInfo,
+    .read = TgaRead,
+    .write = TgaWrite,
+    .maxBits = 24,
+    .extension = "TGA"sv,
+    .description = "(TGA) Targa"sv,
+    .enabled = 1,
+    .flags = FMT_BITMAP | FMT_ALPHA,
+    .canRead = true,
+    .canWrite = true,
+    .settings = &kSettings,
+}};
+
+}  // namespace
+
+std::span<const FormatEntry> TargaRows() { return kRows; }
+
+}  // namespace fotomill

@@ -1,0 +1,161 @@
+#include "registry/format_table.h"
+
+#include <algorithm>
+#include <iterator>
+
+#include "formats/rows.h"
+
+namespace fotomill {
+
+namespace {
+
+// Operations of rows whose codec this build does not have.
+Status NoInfo(PictureRecord&, const char*, uint32_t) { return Status::UnsupportedFunction; }
+Status NoRead(PictureRecord&, const char*) { return Status::UnsupportedFunction; }
+Status NoWrite(PictureRecord&, const WriteOptions&) { return Status::UnsupportedFunction; }
+
+// The fractal format: its coder was never published and is gone.
+Status UnpublishedInfo(PictureRecord&, const char*, uint32_t) { return Status::UnsupportedFormat; }
+Status UnpublishedRead(PictureRecord&, const char*) { return Status::UnsupportedFormat; }
+Status UnpublishedWrite(PictureRecord&, const WriteOptions&) { return Status::UnsupportedFormat; }
+
+// The archive rows' hooks: nothing has to be loaded for ZIP; RAR waits for its library.
+int32_t Ready() { return 1; }
+int32_t NoStartup() { return 0; }
+
+// A place of the registry. A family of codecs fills it by a row of that extension; the facts of a format that no codec of this
+// build knows stand here.
+struct Place {
+  std::string_view extension;
+  std::string_view description = {};
+  int32_t enabled = 0;
+  uint32_t maxBits = 0;
+  uint32_t flags = 0;
+  bool unpublished = false;
+  LifeOperation startup = nullptr;  // and shutdown
+};
+
+// The order is behavior: the first row that matches a name wins, so .jpeg is read as JPE and .tiff as TIF.
+// clang-format off
+constexpr Place kPlaces[] = {
+    {"AVI", "(AVI) Video for Windows", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES},
+    {"BGA", "(BGA) OS/2 Warp", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_ALPHA},
+    {"BMP"},
+    {"CDR", "(CDR) Corel Draw Preview", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES},
+    {"CUT", "(CUT) Dr. Halo", 1, 8, FMT_BITMAP},
+    {"DCX", "(DCX) DCX FAX", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES},
+    {"DIB"},
+    {"EXE", "(EXE) Self-displaying image", 0, 24, FMT_BITMAP},
+    {"FIT"},
+    {"GIF"},
+    {"HDP"},
+    {"HRZ", "(HRZ) SSTV", 1, 24, FMT_BITMAP},
+    {"ICO"},
+    {"IFF", "(IFF) Amiga", 1, 24, FMT_BITMAP},
+    {"IMG", "(IMG) GEM/Ventura", 1, 24, FMT_BITMAP},
+    {"JPG"},
+    {"LBM", "(LBM) Amiga", 1, 8, FMT_BITMAP},
+    {"MAC"},
+    {"MOV", "(MOV) QuickTime movies", 1, 24, FMT_BITMAP | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES},
+    {"MSP", "(MSP) Microsoft Paint", 1, 1, FMT_BITMAP},
+    {"PCD", "(PCD) Kodak Photo-CD", 1, 24, FMT_BITMAP | FMT_MEDIA},
+    {"PCX"},
+    {"PDD", "(PDD) Adobe Photoshop 2.5", 1, 24, FMT_BITMAP},
+    {"PIC", "(PIC) GLPaint/Pegasus", 1, 24, FMT_BITMAP},
+    {"PNG"},
+    {"PSD", "(PSD) Adobe Photoshop 2.5", 1, 24, FMT_BITMAP},
+    {"RAS", "(RAS) Sun Raster", 1, 24, FMT_BITMAP},
+    {"RLE", "(RLE) Windows", 1, 8, FMT_BITMAP},
+    {"SCR", "(SCR) Windows Screen Saver", 1, 24, FMT_BITMAP},
+    {"SGI", "(SGI) Silicon Graphics", 1, 24, FMT_BITMAP | FMT_ALPHA},
+    {"SWF", "(SWF) Flash", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_TIMED | FMT_FRAMES | FMT_LAYERED | FMT_TRANSPARENT | FMT_FLASH},
+    {"TGA"},
+    {"TIF"},
+    {"TXT", "(TXT) Text files", 1, 24, FMT_BITMAP},
+    {"WAV", "(WAV) Windows WAV", 1, 24, FMT_BITMAP | FMT_SOUND | FMT_MEDIA},
+    {"WBMP", "(WBMP) WAP bitmap", 1, 1, FMT_BITMAP},
+    {"WEBP"},
+    {"WPG", "(WPG) WordPerfect Graphics", 1, 8, FMT_BITMAP},
+    {"XBM"},
+    {"Clpbrd", "Windows Clipboard", 1, 24, FMT_BITMAP | FMT_RENDERED | FMT_CLIPBOARD},
+    {"Wllppr", "(BMP) Windows wallpaper", 1, 24, FMT_BITMAP | FMT_WALLPAPER | FMT_NO_OPEN},
+    {"ANI", "(ANI) Windows animated cursor", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES | FMT_LAYERED | FMT_SECONDARY | FMT_TRANSPARENT},
+    {"CAL", "(CAL) CALS", 1, 1, FMT_BITMAP | FMT_SECONDARY},
+    {"CALS", "(CAL) CALS", 1, 1, FMT_BITMAP | FMT_SECONDARY},
+    {"CAM", "(CAM) Casio Digital Camera", 1, 24, FMT_BITMAP | FMT_SECONDARY},
+    {"EMF", "(EMF) Enhanced Metafile", 1, 24, FMT_RENDERED | FMT_SECONDARY},
+    {"EPS", "(EPS) EPS Preview", 0, 24, FMT_SECONDARY},
+    {"FIF", "(FIF) Fractal Image", 1, 24, FMT_BITMAP | FMT_SECONDARY, true},
+    {"FLI", "(FLI) FLIC animation", 1, 8, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES | FMT_SECONDARY},
+    {"FLC", "(FLC) FLIC animation", 1, 8, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES | FMT_SECONDARY},
+    {"FPX", "(FPX) FlashPix", 1, 24, FMT_BITMAP | FMT_SECONDARY},
+    {"FTS"},
+    {"CUR"},
+    {"HAM", "(HAM) Amiga", 1, 24, FMT_BITMAP | FMT_SECONDARY},
+    {"JFI"},
+    {"JFIF"},
+    {"JPE"},
+    {"JPEG"},
+    {"KDC", "(KDC) Kodak Digital Camera", 1, 24, FMT_BITMAP | FMT_SECONDARY},
+    {"PCT", "(PCT) Macintosh PICT", 1, 24, FMT_BITMAP | FMT_SECONDARY},
+    {"KQP", "(KQP) Konica Quality Photos", 1, 24, FMT_BITMAP | FMT_SECONDARY},
+    {"PSP", "(PSP) PSP", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_SECONDARY},
+    {"MID", "(MID) MIDI music", 1, 24, FMT_BITMAP | FMT_SECONDARY | FMT_MEDIA | FMT_MIDI},
+    {"MP3", "(MP3) MP3 compressed music", 1, 24, FMT_BITMAP | FMT_TIMED | FMT_SECONDARY | FMT_MEDIA},
+    {"MP4", "(MP4) MPEG-4 video", 1, 24, FMT_BITMAP | FMT_ANIMATED | FMT_TIMED | FMT_SECONDARY | FMT_MEDIA},
+    {"MPEG", "(MPEG) MPEG-4 video", 1, 24, FMT_BITMAP | FMT_ANIMATED | FMT_TIMED | FMT_SECONDARY | FMT_MEDIA},
+    {"MPG", "(MPG) MPEG-4 video", 1, 24, FMT_BITMAP | FMT_ANIMATED | FMT_TIMED | FMT_SECONDARY | FMT_MEDIA},
+    {"M4V", "(M4V) MPEG-4 video", 1, 24, FMT_BITMAP | FMT_ANIMATED | FMT_TIMED | FMT_SECONDARY | FMT_MEDIA},
+    {"RGB", "(RGB) Silicon Graphics", 1, 24, FMT_BITMAP | FMT_SECONDARY | FMT_ALPHA},
+    {"TTF", "(TTF) TrueType Font", 1, 24, FMT_BITMAP | FMT_SECONDARY},
+    {"OTF", "(OTF) OpenType Font", 1, 24, FMT_BITMAP | FMT_SECONDARY},
+    {"UUE", "(UUE) UUEncoded graphics", 1, 24, FMT_BITMAP | FMT_SECONDARY},
+    {"WDP"},
+    {"WMF", "(WMF) Windows Metafile", 1, 24, FMT_RENDERED | FMT_SECONDARY},
+    {"WMV", "(WMV) WMV video", 1, 24, FMT_BITMAP | FMT_ANIMATED | FMT_TIMED | FMT_SECONDARY | FMT_MEDIA},
+    {"RAR", "(RAR) RAR archive", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_CONTAINER | FMT_LAYERED | FMT_SECONDARY | FMT_ARCHIVE, false, NoStartup},
+    {"ZIP", "(ZIP) ZIP archive", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_CONTAINER | FMT_LAYERED | FMT_SECONDARY | FMT_ARCHIVE, false, Ready},
+};
+// clang-format on
+static_assert(std::size(kPlaces) == kSpareRow);
+
+FormatEntry RowWithoutCodec(const Place& place) {
+  FormatEntry row;
+  row.info = place.unpublished ? UnpublishedInfo : NoInfo;
+  row.read = place.unpublished ? UnpublishedRead : NoRead;
+  row.write = place.unpublished ? UnpublishedWrite : NoWrite;
+  row.startup = row.shutdown = place.startup;
+  row.canStartUp = place.startup == Ready;
+  row.maxBits = place.maxBits;
+  row.extension = place.extension;
+  row.description = place.description;
+  row.enabled = place.enabled;
+  row.flags = place.flags;
+  row.whyNot = place.unpublished ? "The format was never published." : "This build has no codec for the format.";
+  return row;
+}
+
+}  // namespace
+
+std::vector<std::span<const FormatEntry>> FormatFamilies() {
+  return {
+#define FAMILY(name) name##Rows(),
+#include "formats/families.def"
+#undef FAMILY
+  };
+}
+
+FormatTable MakeFormatTable() {
+  FormatTable table;
+  std::ranges::transform(kPlaces, table.begin(), RowWithoutCodec);
+  table[kSpareRow] = SpareRow();
+  for (const std::span<const FormatEntry> family : FormatFamilies()) {
+    for (const FormatEntry& row : family) {
+      const auto place = std::ranges::find(kPlaces, row.extension.view(), &Place::extension);
+      if (place != std::end(kPlaces)) table[static_cast<size_t>(place - kPlaces)] = row;
+    }
+  }
+  return table;
+}
+
+}  // namespace fotomill
