@@ -2,12 +2,12 @@
 
 #include <algorithm>
 
+#include "core/choice_lists.h"
 #include "core/plain_name.h"
 #include "core/text.h"
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "registry/registry.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -15,17 +15,6 @@ namespace {
 
 constexpr std::string_view kNotPlain = "The name cannot lead to another folder.";
 constexpr std::string_view kTooLong = "The path would be longer than 260 characters.";
-
-struct FunctionPrefix {
-  FileFunction function;
-  SettingPrefix Settings::*key;
-};
-constexpr FunctionPrefix kPrefixes[] = {
-    {FileFunction::Annotate, &Settings::PrefixAnnotate},   {FileFunction::Catalog, &Settings::PrefixCatalog},
-    {FileFunction::Crop, &Settings::PrefixCrop},           {FileFunction::Effects, &Settings::PrefixEffects},
-    {FileFunction::Filter, &Settings::PrefixFilter},       {FileFunction::Matt, &Settings::PrefixMatt},
-    {FileFunction::Transform, &Settings::PrefixTransform}, {FileFunction::Watermark, &Settings::PrefixWatermark},
-};
 
 bool FitsPath(const std::string& path) { return path.size() <= PathText::Capacity(); }
 
@@ -73,16 +62,16 @@ bool AskName(Destination& destination, const std::string& source, std::string_vi
 // The check boxes that are settings are kept as the user left them.
 void StoreChecks(const OverwriteChecks& old, const OverwriteChecks& now, BatchJob& job) {
   const struct {
-    KeyNumber key;
+    Remembered what;
     bool was, is;
   } flags[] = {
-      {KeyNumber::PromptBeforeOverwrite, old.notify, now.notify},
-      {KeyNumber::OverwriteKeepBoth, old.keepBoth, now.keepBoth},
-      {KeyNumber::OverwritePromptRecycle, old.recycle, now.recycle},
-      {KeyNumber::OverwritePromptPreviews, old.previews, now.previews},
+      {Remembered::PromptBeforeOverwrite, old.notify, now.notify},
+      {Remembered::OverwriteKeepBoth, old.keepBoth, now.keepBoth},
+      {Remembered::OverwriteRecycle, old.recycle, now.recycle},
+      {Remembered::OverwritePreviews, old.previews, now.previews},
   };
   for (const auto& flag : flags) {
-    if (flag.was != flag.is) job.prompts->StoreFlag(flag.key, flag.is);
+    if (flag.was != flag.is && job.remember) job.remember(flag.what, flag.is ? 1 : 0);
   }
   job.overwrite.prompt = now.notify;
   job.overwrite.keepBoth = now.keepBoth;
@@ -153,13 +142,6 @@ std::string CasedExtension(std::string_view formatExtension, std::string_view so
   return extension;
 }
 
-std::string_view PrefixOf(FileFunction function) {
-  for (const FunctionPrefix& prefix : kPrefixes) {
-    if (prefix.function == function) return (settings.*prefix.key).view();
-  }
-  return {};
-}
-
 std::string_view ExtensionOfFormat(const BatchJob& job) {
   if (!job.extension.empty() || job.formatIndex == kNoFormat) return job.extension;
   return FormatRow(job.formatIndex).extension.view();
@@ -177,7 +159,7 @@ std::string PlannedDestination(const std::string& source, std::string_view below
 
 bool IsDestinationWanted(const BatchJob& job, bool intoFolder) {
   if (job.prompts == nullptr) return true;
-  if (settings.WarnDestinationWrite != 0) {
+  if (job.naming.confirmFormat) {
     const std::string format = UpperCase(ExtensionOfFormat(job));
     if (!job.prompts->ConfirmFormat("Write files to the " + format + " format?")) return false;
   }

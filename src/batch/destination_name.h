@@ -20,10 +20,6 @@ std::string CasedExtension(std::string_view formatExtension, std::string_view so
 // folder that is not there may be made (unless the outputs do not go `intoFolder`). False when the user wants something else.
 bool IsDestinationWanted(const BatchJob& job, bool intoFolder);
 
-// What a function puts in front of the names of its outputs, by its Prefix... key; blanks belong to it. Empty for functions
-// that put nothing there.
-std::string_view PrefixOf(FileFunction function);
-
 // The extension of the job's outputs as the format has it.
 std::string_view ExtensionOfFormat(const BatchJob& job);
 

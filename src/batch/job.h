@@ -1,7 +1,10 @@
 #pragma once
 
+#include <array>
 #include <cstdint>
+#include <functional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "batch/progress_box.h"
@@ -10,13 +13,12 @@
 #include "core/status.h"
 #include "processing/palette/reduce.h"
 #include "registry/registry.h"
-#include "settings/job_options.h"
 
 namespace fotomill {
 
 class Prompts;
 
-// What happens to an output whose name is taken. Begins as the settings say; answers of the overwrite prompt change it.
+// What happens to an output whose name is taken. Answers of the overwrite prompt change it.
 struct OverwritePolicy {
   bool prompt = true;    // ask; without it the file that is there is replaced
   bool keepBoth = true;  // what a prompt is answered with that nobody is shown: a numbered variant
@@ -24,21 +26,25 @@ struct OverwritePolicy {
   bool previews = true;  // in the prompt
   bool skip = false;     // leave out the file, without a question
 };
-// From PromptBeforeOverwrite, OverwriteKeepBoth and the OverwritePrompt... keys as they are now.
-// `skip` is off: no key sets it.
-OverwritePolicy OverwritePolicyFromSettings();
 
 // How outputs get their names.
-struct NamingRules {
+struct NamingOptions {
   int32_t extensionCase = 0;  // ExtensionCaseStyle
   bool askName = false;       // PromptForDestName
   bool beside = false;        // DestForceSourceDir: every output lies beside its source
   bool askPassword = false;   // PasswordProtect
+  bool confirmFormat = true;  // WarnDestinationWrite: the format is asked about before anything is written
   int32_t firstVariant = 1, lastVariant = INT32_MAX;
+  // What functions put in front of the names of their outputs; blanks belong to it. By number of the function; empty for
+  // those that put nothing there.
+  std::array<FixedText<32>, kFileFunctionCount> prefixes = {};
+
+  std::string_view PrefixOf(FileFunction function) const { return prefixes[static_cast<size_t>(function)].view(); }
 };
-// From the keys named above as they are now, ExtensionCaseStyle, and NumberedVariantMin and
-// NumberedVariantMax for the variants.
-NamingRules NamingRulesFromSettings();
+
+// What holds for later jobs as well once the user has changed it during one: the check boxes of the overwrite prompt, 0 or 1,
+// and the number that the next sequential rename begins with.
+enum class Remembered { PromptBeforeOverwrite, OverwriteKeepBoth, OverwriteRecycle, OverwritePreviews, NextRenameNumber };
 
 // How far a sequential rename has counted.
 struct SequentialRenameState {
@@ -46,12 +52,10 @@ struct SequentialRenameState {
   int32_t digits = 4;
   PathText baseName;
 };
-// The start of a new rename: SequentialRenameBaseNumber and SequentialRenameBaseName as they are
-// now.
-SequentialRenameState SequentialRenameFromSettings();
 
-// What one running function carries along: what it was asked for and what came of it. Belongs to the thread that runs the
-// batch.
+// What one running function carries along: what it was asked for and what came of it. Jobs of the user's settings come from
+// NewBatchJob; by itself a job has the built-in defaults, puts nothing in front of names, and keeps nothing. Belongs to the
+// thread that runs the batch.
 struct BatchJob {
   PathText source;                  // the file in work
   int32_t formatIndex = kNoFormat;  // of the outputs
@@ -67,10 +71,14 @@ struct BatchJob {
   SequentialRenameState rename;
   bool filesChanged = false;  // a file was renamed or written: browsers have to look again
 
-  OverwritePolicy overwrite = OverwritePolicyFromSettings();
-  NamingRules naming = NamingRulesFromSettings();
-  bool writeComments = WritesCommentsFromSettings();        // into files of plug-in formats
-  ReduceOptions reduction = ReduceOptionsFromSettings();  // of outputs whose format takes fewer colors
+  OverwritePolicy overwrite;
+  NamingOptions naming;
+  ReduceOptions reduction;          // of outputs whose format takes fewer colors
+  ProgressSettings boxSettings;
+  uint32_t historyFunctions = ~0u;  // FileHistoryFunctions: a bit for each function whose files are recorded
+  bool writeComments = false;       // into files of plug-in formats
+  // Keeps a value for good. Called on the thread that runs the batch; none: nothing is kept.
+  std::function<void(Remembered what, int32_t value)> remember = {};
   ProgressModel progress;
   uint32_t writeAborts = 0;   // files left out because no numbered variant was free
   std::vector<FileUse> uses;  // for the file history, which belongs to the main thread: UpdateFileHistory(job.uses)

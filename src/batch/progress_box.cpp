@@ -46,7 +46,7 @@ void SetStatus(BatchJob& job, std::string_view text) {
 
 void FinishProgress(BatchJob& job) {
   const size_t first = job.progress.Lines().size();
-  job.progress.Finish(job.errors, !job.noSummary, ProgressSettingsInForce());
+  job.progress.Finish(job.errors, !job.noSummary, job.boxSettings);
   if (job.box == nullptr) return;
   for (size_t i = first; i < job.progress.Lines().size(); ++i) job.box->ShowLine(job.progress.Lines()[i], nullptr);
   if (job.progress.IsOpen()) {

@@ -1,7 +1,5 @@
 #include "batch/progress_model.h"
 
-#include "settings/settings.h"
-
 namespace fotomill {
 
 namespace {
@@ -13,13 +11,6 @@ constexpr int32_t kButtonWidth = 64, kButtonHeight = 22, kButtonUp = 30;
 constexpr int32_t kThumbnailRow = 54;
 
 }  // namespace
-
-ProgressSettings ProgressSettingsInForce() {
-  return {.closeWhenDone = settings.CloseProgressWhenDone != 0,
-          .optimizeWindow = settings.ProgressOptimizeWindow != 0,
-          .thumbnails = settings.ProgressThumbnails != 0,
-          .showMissingThumbnails = settings.ProgressShowMissingThumbnails != 0};
-}
 
 void ProgressModel::Open() {
   *this = ProgressModel();

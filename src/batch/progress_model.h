@@ -32,8 +32,6 @@ struct ProgressSettings {
   bool thumbnails = true;
   bool showMissingThumbnails = false;
 };
-// From the progress keys as they are now.
-ProgressSettings ProgressSettingsInForce();
 
 // The box's title, and the window class by which other programs find it.
 inline constexpr const char* kProgressTitle = "Progress";

@@ -5,7 +5,6 @@
 #include <string_view>
 
 #include "picture/picture_record.h"
-#include "settings/key_table.h"
 
 namespace fotomill {
 
@@ -75,9 +74,6 @@ class Prompts {
   virtual bool ConfirmFormat(const std::string& question) = 0;
   // Whether a destination folder that is not there may be made. False ends the batch before it begins.
   virtual bool ConfirmNewFolder(const std::string& folder) = 0;
-  // The user changed one of the check boxes that are settings. The base class stores it for good, on the calling thread;
-  // a face whose configuration belongs to another thread hands it over there.
-  virtual void StoreFlag(KeyNumber key, bool value);
 };
 
 }  // namespace fotomill

@@ -7,7 +7,6 @@
 #include "platform/clock.h"
 #include "platform/folders.h"
 #include "platform/process.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -49,7 +48,7 @@ void ReportedRun::Tick() {
 }
 
 void ReportedRun::NoteUse(const std::string& source) {
-  if ((settings.FileHistoryFunctions >> static_cast<int32_t>(way_.history) & 1) == 0) return;
+  if ((job_.historyFunctions >> static_cast<uint32_t>(way_.history) & 1) == 0) return;
   const auto now = static_cast<int32_t>(platform::Now());
   job_.uses.push_back({platform::AbsolutePath(source), way_.history, kOwnTime, now, false});
 }

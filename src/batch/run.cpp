@@ -47,7 +47,7 @@ class Batch {
       : files_(files),
         function_(function),
         job_(job),
-        prefix_(function.prefix ? *function.prefix : std::string(PrefixOf(function.history))),
+        prefix_(function.prefix ? *function.prefix : std::string(job.naming.PrefixOf(function.history))),
         asksEveryName_(AsksEveryName(job)),
         run_(files, job,
              {.process = [this](size_t i) { return Process(i); }, .history = function.history, .dryRun = function.dryRun}) {

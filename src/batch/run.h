@@ -23,7 +23,7 @@ struct BatchFunction {
   // Works on the decoded picture; empty when it is only converted. Called on several threads at once, on a picture each.
   std::function<Status(PictureRecord& picture)> transform = {};
   FileFunction history = FileFunction::Convert;  // under which the sources go into the file history
-  std::optional<std::string> prefix = {};        // in front of every name: at most 32 characters, a plain name; none: PrefixOf
+  std::optional<std::string> prefix = {};        // in front of every name: at most 32 characters, a plain name; none: the job's
   std::string out = {};                          // not empty: the whole path of the output of a selection of one
   int32_t page = 1;                              // of files with several, from 1
   uint32_t jobs = 0;                             // pictures in work at a time; 0: one a core

@@ -10,8 +10,6 @@
 #include "platform/clock.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
-#include "settings/configuration.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -20,13 +18,10 @@ namespace {
 constexpr double kStoreInterval = 1;  // seconds between two writes of the next number
 constexpr const char* kNotSafe = "It could not be noted for --undo.";
 
-// The next number as the setting can hold it.
-int32_t SettingOf(uint32_t number) { return static_cast<int32_t>(std::min<uint32_t>(number, INT32_MAX)); }
-
-// Keeps the number that the next run begins with.
+// Has the job remember the number that the next run begins with: a few times a second at most, and at the end.
 class NextNumber {
  public:
-  NextNumber(const RenameOptions& options, bool update) : options_(options), on_(update && !options.dryRun) {}
+  NextNumber(const BatchJob& job, bool on) : job_(job), on_(on && job.remember) {}
   ~NextNumber() { Store(); }
   NextNumber(const NextNumber&) = delete;
   NextNumber& operator=(const NextNumber&) = delete;
@@ -42,14 +37,10 @@ class NextNumber {
     if (!set_) return;
     set_ = false;
     stored_ = platform::MonotonicSeconds();
-    if (options_.storeNumber) return options_.storeNumber(number_);
-    const KeyRow& key = KeyOf(KeyNumber::SequentialRenameBaseNumber);
-    SettingValue value;
-    value.number = SettingOf(number_);
-    if (StoreSetting(key, value) != SaveResult::Done) StoreNumber(key, value.number);  // it holds for this run at least
+    job_.remember(Remembered::NextRenameNumber, static_cast<int32_t>(std::min<uint32_t>(number_, INT32_MAX)));
   }
 
-  const RenameOptions& options_;
+  const BatchJob& job_;
   const bool on_;
   bool set_ = false;
   uint32_t number_ = 0;
@@ -94,16 +85,6 @@ FileOutcome RenameOne(const BatchFile& file, const SequentialRenameRules& rules,
 }
 
 }  // namespace
-
-SequentialRenameRules SequentialRenameRulesFromSettings() {
-  return {.increment = static_cast<uint32_t>(std::max(settings.SequentialRenameIncrement, 1)),
-          .maxAttempts = static_cast<uint32_t>(std::max(settings.SequentialRenameMaxAttempts, 1)),
-          .separator = settings.SequentialRenameHyphen != 0 ? std::string(settings.SequentialRenameSep) : std::string(),
-          .numberFirst = settings.SequentialRenamePrefix != 0,
-          .skipColliding = settings.SequentialRenameSkipCollide != 0,
-          .update = settings.SequentialRenameUpdate != 0,
-          .random = settings.SequentialRenameRandom != 0};
-}
 
 bool RenamedFiles::Exists(const std::string& path) const {
   if (there_.contains(path)) return true;
@@ -161,13 +142,15 @@ std::vector<size_t> RandomOrder(size_t count, uint64_t seed) {
 
 void RunRename(std::span<const BatchFile> files, const RenameOptions& options, BatchJob& job) {
   if (!OpenProgressBox(job)) return;
-  const SequentialRenameRules rules = SequentialRenameRulesFromSettings();
+  const SequentialRenameRules& rules = options.rules;
+  job.rename = {.number = rules.number, .digits = rules.digits, .baseName = {}};
+  job.rename.baseName.AssignCut(rules.baseName);
   std::vector<size_t> order(files.size());
   std::iota(order.begin(), order.end(), size_t{0});
   if (rules.random) order = RandomOrder(files.size(), options.seed ? *options.seed : std::random_device()());
   RenamedFiles renamed(options.dryRun);
   RenameLog log;
-  NextNumber next(options, rules.update);
+  NextNumber next(job, rules.update && !options.dryRun);
   uint32_t done = 0;
   for (const size_t place : order) {
     if (AbortAsked() || (job.box != nullptr && !job.box->GoesOn())) break;

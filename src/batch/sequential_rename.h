@@ -14,18 +14,19 @@
 
 namespace fotomill {
 
-// How files are numbered: the SequentialRename... keys.
+// How files are named and numbered: the SequentialRename... keys.
 struct SequentialRenameRules {
+  std::string baseName = "PICTURE";
+  uint32_t number = 1;  // the first
+  int32_t digits = 4;
   uint32_t increment = 1;  // at least 1
   uint32_t maxAttempts = 32760;
-  std::string separator;     // between name and number; empty: none
+  std::string separator = {};  // between name and number; empty: none
   bool numberFirst = false;  // the number, then the file's own old name
   bool skipColliding = false;
-  bool update = true;  // the next number goes into SequentialRenameBaseNumber
+  bool update = true;  // the job remembers the next number
   bool random = false;
 };
-// From the keys as they are now.
-SequentialRenameRules SequentialRenameRulesFromSettings();
 
 // The files that are renamed. In a dry run they only seem to be.
 class RenamedFiles {
@@ -52,17 +53,15 @@ Status RenameSequentially(BatchJob& job, std::string& path, const SequentialRena
 // The order of a random run: places 0 to count - 1, the same for the same seed everywhere.
 std::vector<size_t> RandomOrder(size_t count, uint64_t seed);
 
-// How one run goes, beside what the settings say.
+// How one run goes.
 struct RenameOptions {
+  SequentialRenameRules rules = {};
   std::optional<uint64_t> seed = {};  // of the random order; none: another one each time
   bool dryRun = false;
-  // Keeps the next number for good; called a few times a second at most and at the end. None: StoreSetting does, on the
-  // calling thread.
-  std::function<void(uint32_t next)> storeNumber = {};
 };
 
-// Renames a selection: opens the job's progress box, reports every file, finishes the box. What was renamed can be taken back
-// by UndoRename until the next run.
+// Renames a selection by the rules of the options: opens the job's progress box, reports every file, finishes the box. What
+// was renamed can be taken back by UndoRename until the next run.
 void RunRename(std::span<const BatchFile> files, const RenameOptions& options, BatchJob& job);
 // Gives the files of the last run their old names again, the last one first; with `only`, absolute paths, those of them
 // only. What cannot be taken back can be tried again. Unreadable: false, nothing was done.

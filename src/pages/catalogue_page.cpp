@@ -19,7 +19,6 @@
 #include "platform/paths.h"
 #include "platform/process.h"
 #include "processing/palette/reduce.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -36,7 +35,7 @@ bool NextPageName(BatchJob& job, std::string& path) {
   do {
     if (++job.cataloguePage >= kLastCataloguePage) return false;
     path = platform::JoinFolder(job.destinationFolder,
-                                CataloguePageName(PrefixOf(FileFunction::Catalog), job.cataloguePage, ExtensionOfFormat(job)));
+                                CataloguePageName(job.naming.PrefixOf(FileFunction::Catalog), job.cataloguePage, ExtensionOfFormat(job)));
   } while (platform::FileExists(path));
   return true;
 }
@@ -56,7 +55,7 @@ class ContactSheet {
   ContactSheet(std::span<const BatchFile> files, const ContactSheetOptions& options, BatchJob& job)
       : files_(files), options_(options), job_(job), cells_(files.size()) {}
 
-  Status OpenFont() { return options_.look.names ? font_.Open(settings.CatalogFontName.view(), kCaptionHeight) : Status::Ok; }
+  Status OpenFont() { return options_.look.names ? font_.Open(options_.fontName, kCaptionHeight) : Status::Ok; }
 
   void Run() {
     const uint32_t jobs = options_.jobs == 0 ? platform::CoreCount() : options_.jobs;
@@ -99,7 +98,7 @@ class ContactSheet {
   Status DrawPicture(PictureRecord& picture, PackedImage& image) const {
     picture.thumbnailSide = std::max(options_.look.cellWidth, options_.look.cellHeight);
     RETURN_IF_BAD(ReadPicture(picture));
-    if (settings.ExifAdjustOrientation != 0) RETURN_IF_BAD(TurnUpright(picture));
+    if (options_.upright) RETURN_IF_BAD(TurnUpright(picture));
     return MakeCellImage(picture, options_.look, image);
   }
 

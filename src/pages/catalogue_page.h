@@ -31,6 +31,8 @@ Status WriteCataloguePage(PictureRecord& page, const CataloguePageOptions& optio
 struct ContactSheetOptions {
   CatalogueLook look;
   CataloguePageOptions page;
+  std::string fontName = "Arial";  // of the names
+  bool upright = true;             // pictures are turned as their EXIF says
   std::string reduceHint = {};  // goes behind "Too many colors."
   uint32_t jobs = 0;            // pictures in work at a time; 0: one a core
 };

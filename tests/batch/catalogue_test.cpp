@@ -4,6 +4,7 @@
 #include <filesystem>
 
 #include "batch/abort.h"
+#include "batch/new_job.h"
 #include "pages/catalogue_page.h"
 #include "settings/settings.h"
 #include "support/bitmaps.h"
@@ -94,7 +95,7 @@ TEST(CataloguePage, FirstFreeNames) {
   EXPECT_EQ(CataloguePageName("", 123456, "png"), "123456.png");
   const TemporaryFolder folder;
   WriteText(folder.Path("Catalog_00002.bmp"), "mine");
-  BatchJob job;
+  BatchJob job = NewBatchJob();
   job.formatIndex = FindFormatByName("x.bmp");
   job.destinationFolder = folder.Path();
   job.naming.extensionCase = 1;  // is for names that follow a source's, and makes no page replace another
@@ -125,7 +126,7 @@ TEST(CataloguePage, SheetsAreTheSameWithAnyNumberOfJobs) {
   std::vector<std::vector<uint8_t>> sheets;
   for (const uint32_t jobs : {1u, 4u}) {
     ContactSheetOptions options{.look = {.columns = 3, .rows = 1}, .page = {}, .jobs = jobs};
-    BatchJob job;
+    BatchJob job = NewBatchJob();
     job.formatIndex = FindFormatByName("x.bmp");
     job.destinationFolder = folder.Path("out" + std::to_string(jobs));
     ASSERT_EQ(RunContactSheet(files, options, job), Status::Ok);
@@ -169,7 +170,7 @@ TEST(CataloguePage, APageThatIsNotFullIsNotWrittenAfterAbort) {
   for (const uint32_t jobs : {1u, 3u}) {
     SCOPED_TRACE(jobs);
     const ContactSheetOptions options{.look = {.columns = 3, .rows = 1}, .page = {}, .jobs = jobs};
-    BatchJob job;
+    BatchJob job = NewBatchJob();
     AbortingBox box(job, files[3].name);
     job.box = &box;
     job.formatIndex = FindFormatByName("x.bmp");

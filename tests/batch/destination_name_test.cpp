@@ -15,7 +15,6 @@ class ScriptedPrompts : public Prompts {
   std::vector<OverwriteAnswer> answers;
   std::vector<std::optional<std::string>> names;
   std::vector<OverwriteQuestion> questions;
-  std::vector<std::string> stored;
 
   std::optional<std::string> AskDestinationName(const NameQuestion&) override {
     const auto name = names.empty() ? std::nullopt : names.front();
@@ -32,7 +31,6 @@ class ScriptedPrompts : public Prompts {
   std::optional<std::string> AskPassword(const std::string&) override { return std::nullopt; }
   bool ConfirmFormat(const std::string&) override { return true; }
   bool ConfirmNewFolder(const std::string&) override { return true; }
-  void StoreFlag(KeyNumber key, bool value) override { stored.push_back(std::string(KeyOf(key).name) + (value ? "=1" : "=0")); }
 };
 
 int32_t RowOf(std::string_view extension) { return FindFormatByName("x." + std::string(extension)); }
@@ -100,7 +98,7 @@ TEST(DestinationName, WhatBecomesOfATakenName) {
     std::vector<OverwriteAnswer> answers;
     const char* outcome;
     size_t questions;
-    std::vector<std::string> stored = {};
+    std::vector<std::pair<Remembered, int32_t>> kept = {};
   } rows[] = {
       {"nobody to ask", {.keepBoth = false}, false, false, {}, "a [2].tif", 0},
       {"no prompt", {.prompt = false}, false, true, {}, "!a.tif", 0},
@@ -110,7 +108,7 @@ TEST(DestinationName, WhatBecomesOfATakenName) {
       {"applied to the rest", {.keepBoth = false}, true, true, {}, "!a.tif", 0},
       {"cancelled", {}, false, true, {{}}, "skipped", 1},
       {"both", {}, false, true, {{true, ask, "b", false}}, "a [2].tif", 1},
-      {"replaced", {}, false, true, {{true, replace, "a", false}}, "!a.tif", 1, {"OverwriteKeepBoth=0"}},
+      {"replaced", {}, false, true, {{true, replace, "a", false}}, "!a.tif", 1, {{Remembered::OverwriteKeepBoth, 0}}},
       {"renamed", {.keepBoth = false}, false, true, {{true, replace, "new", false}}, "new.tif", 1},
       {"renamed to a taken one, then cancelled", {.keepBoth = false}, false, true, {{true, replace, "b", false}}, "skipped", 2},
       {"renamed to a taken one, for all",
@@ -134,7 +132,7 @@ TEST(DestinationName, WhatBecomesOfATakenName) {
        {{true, {.notify = false, .keepBoth = false, .recycle = true, .previews = false}, "a", false}},
        "!~a.tif",
        1,
-       {"PromptBeforeOverwrite=0", "OverwritePromptRecycle=1", "OverwritePromptPreviews=0"}},
+       {{Remembered::PromptBeforeOverwrite, 0}, {Remembered::OverwriteRecycle, 1}, {Remembered::OverwritePreviews, 0}}},
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.name);
@@ -143,10 +141,12 @@ TEST(DestinationName, WhatBecomesOfATakenName) {
     BatchJob job;
     job.overwrite = row.policy;
     job.applyToRest = row.applyToRest;
+    std::vector<std::pair<Remembered, int32_t>> kept;
+    job.remember = [&](Remembered what, int32_t value) { kept.emplace_back(what, value); };
     job.prompts = row.prompts ? &prompts : nullptr;
     EXPECT_EQ(Settle(job, {"a.tif", "a [1].tif", "b.tif"}, "a.bmp"), row.outcome);
     EXPECT_EQ(prompts.questions.size(), row.questions);
-    EXPECT_EQ(prompts.stored, row.stored);
+    EXPECT_EQ(kept, row.kept);
   }
 }
 

@@ -9,6 +9,7 @@
 #include <map>
 #include <thread>
 
+#include "batch/new_job.h"
 #include "batch/abort.h"
 #include "support/bitmaps.h"
 #include "support/faults.h"
@@ -26,7 +27,7 @@ class Run : public testing::Test {
   std::string In(const std::string& name) const { return folder_.Path(name); }
 
   BatchJob NewJob() const {
-    BatchJob job;
+    BatchJob job = NewBatchJob();
     job.formatIndex = FindFormatByName("x.pcx");
     job.destinationFolder = In("out");
     return job;

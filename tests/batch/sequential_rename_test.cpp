@@ -5,6 +5,7 @@
 
 #include <filesystem>
 
+#include "batch/new_job.h"
 #include "core/data_folder.h"
 #include "files/rename_log.h"
 #include "settings/settings.h"
@@ -38,13 +39,16 @@ class Rename : public testing::Test {
     std::sort(files.begin(), files.end());
     return files;
   }
-  BatchJob RunOn(const std::vector<std::string>& names, const RenameOptions& options = {}) const {
+  BatchJob RunOn(const std::vector<std::string>& names, const RenameOptions& options) const {
     std::vector<BatchFile> files;
     for (const std::string& name : names) files.push_back({folder_.Path("p/" + name), {}, Status::Ok, {}});
-    BatchJob job;
-    job.rename = SequentialRenameFromSettings();
+    BatchJob job = NewBatchJob();
     RunRename(files, options, job);
     return job;
+  }
+  // With the rules of the settings.
+  BatchJob RunAsSet(const std::vector<std::string>& names, bool dryRun = false) const {
+    return RunOn(names, {.rules = SequentialRenameRulesFromSettings(), .dryRun = dryRun});
   }
 
   TemporaryFolder folder_;
@@ -132,10 +136,10 @@ TEST_F(Rename, Names) {
     settings.SequentialRenameHyphen = row.hyphen;
     settings.SequentialRenamePrefix = row.prefix;
     settings.SequentialRenameSkipCollide = row.skip;
-    const BatchJob dry = RunOn(row.renamed, {.dryRun = true});
+    const BatchJob dry = RunAsSet(row.renamed, true);
     EXPECT_EQ(There().size(), row.there.size());
     EXPECT_EQ(settings.SequentialRenameBaseNumber, row.number);
-    const BatchJob job = RunOn(row.renamed);
+    const BatchJob job = RunAsSet(row.renamed);
     EXPECT_EQ(There(), row.after);
     EXPECT_EQ(settings.SequentialRenameBaseNumber, row.next);
     EXPECT_EQ(job.errors, row.errors);
@@ -144,9 +148,21 @@ TEST_F(Rename, Names) {
   }
 }
 
+// A run that waits for others begins when the settings may long have changed.
+TEST_F(Rename, RunsByTheRulesThatItWasStartedWith) {
+  Make({"a.jpg", "b.jpg"});
+  settings.SequentialRenameIncrement = 5;
+  const RenameOptions options{.rules = SequentialRenameRulesFromSettings()};
+  settings = defaultSettings;
+  settings.SequentialRenameBaseName = std::string_view("LATER");
+  settings.SequentialRenameHyphen = settings.SequentialRenameRandom = settings.SequentialRenameSkipCollide = 1;
+  RunOn({"a.jpg", "b.jpg"}, options);
+  EXPECT_THAT(There(), ElementsAre("PICTURE0001.jpg=a.jpg", "PICTURE0006.jpg=b.jpg"));
+}
+
 TEST_F(Rename, TakenBack) {
   Make({"a.jpg", "b.jpg", "c.jpg"});
-  const BatchJob job = RunOn({"a.jpg", "b.jpg", "c.jpg"});
+  const BatchJob job = RunAsSet({"a.jpg", "b.jpg", "c.jpg"});
   ASSERT_EQ(job.uses.size(), 6u);
   EXPECT_EQ(job.uses[0].path, folder_.Path("p/a.jpg"));
   EXPECT_TRUE(job.uses[0].removed && !job.uses[1].removed && job.uses[1].function == FileFunction::MoveAndCopy);
@@ -169,11 +185,10 @@ TEST_F(Rename, RandomOrderIsThatOfItsSeed) {
   EXPECT_EQ(RandomOrder(100, 5), RandomOrder(100, 5));
   EXPECT_NE(RandomOrder(100, 5), RandomOrder(100, 6));
   Make({"a", "b", "c", "d"});
-  settings.SequentialRenameRandom = 1;
   std::vector<std::string> expected;
   const std::vector<size_t> order = RandomOrder(4, 3);
   for (size_t i = 0; i < 4; ++i) expected.push_back("PICTURE000" + std::to_string(i + 1) + "=" + "abcd"[order[i]]);
-  RunOn({"a", "b", "c", "d"}, {.seed = 3});
+  RunOn({"a", "b", "c", "d"}, {.rules = {.random = true}, .seed = 3});
   EXPECT_EQ(There(), expected);
 }
 

@@ -5,6 +5,7 @@
 #include <optional>
 #include <string>
 
+#include "batch/new_job.h"
 #include "cli/frame/destination_format.h"
 #include "cli/frame/file_selection.h"
 #include "cli/frame/options.h"
@@ -80,8 +81,11 @@ std::string ReadLook(const SheetOptions& options, CatalogueLook& look) {
 }
 
 int RunSheet(const SheetOptions& options, const CommandContext& context) {
-  BatchJob job;
+  BatchJob job = NewBatchJob();
+  job.remember = nullptr;
   ContactSheetOptions sheet;
+  sheet.fontName = settings.CatalogFontName.view();
+  sheet.upright = settings.ExifAdjustOrientation != 0;
   if (const std::string wrong = ReadDestinationFormat(options.to, job); !wrong.empty()) return UsageError(context, wrong);
   if (const std::string wrong = ReadLook(options, sheet.look); !wrong.empty()) return UsageError(context, wrong);
   if (platform::FileExists(options.dest) && !platform::IsFolder(options.dest)) {

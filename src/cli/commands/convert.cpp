@@ -3,6 +3,7 @@
 #include <memory>
 #include <string>
 
+#include "batch/new_job.h"
 #include "batch/run.h"
 #include "cli/frame/destination_format.h"
 #include "cli/frame/file_selection.h"
@@ -92,7 +93,8 @@ std::string CheckOptions(const ConvertOptions& options, const CommandContext& co
 }
 
 int RunConvert(const ConvertOptions& options, const CommandContext& context) {
-  BatchJob job;
+  BatchJob job = NewBatchJob();
+  job.remember = nullptr;
   if (const std::string wrong = CheckOptions(options, context, job); !wrong.empty()) return UsageError(context, wrong);
   const auto files = SelectFiles(options.selection, context);
   if (!files) return kExitUsage;

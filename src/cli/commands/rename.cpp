@@ -5,6 +5,7 @@
 #include <set>
 #include <string>
 
+#include "batch/new_job.h"
 #include "batch/sequential_rename.h"
 #include "cli/frame/file_selection.h"
 #include "cli/frame/options.h"
@@ -43,15 +44,14 @@ int RunRenameCommand(const RenameCommandOptions& options, const CommandContext& 
   }
   ResultOutput output(context, options.json);
   TerminalBox box(output, true, false);
-  BatchJob job;
+  BatchJob job = NewBatchJob();
   job.box = &box;
-  job.rename = SequentialRenameFromSettings();
-  if (options.digits > 0) job.rename.digits = options.digits;
   int status = kExitOk;
   if (options.undo) {
     status = RunUndo(options, files, output, job);
   } else {
-    RenameOptions rename{.dryRun = options.dryRun};
+    RenameOptions rename{.rules = SequentialRenameRulesFromSettings(), .dryRun = options.dryRun};
+    if (options.digits > 0) rename.rules.digits = options.digits;
     if (options.seed >= 0) rename.seed = static_cast<uint64_t>(options.seed);
     RunRename(files, rename, job);
   }

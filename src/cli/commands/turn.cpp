@@ -4,6 +4,7 @@
 #include <memory>
 #include <string>
 
+#include "batch/new_job.h"
 #include "batch/turn_run.h"
 #include "cli/frame/file_selection.h"
 #include "cli/frame/options.h"
@@ -69,7 +70,7 @@ int RunTurnCommand(const TurnOptions& options, const CommandContext& context) {
                         .keepTree = options.keepTree,
                         .jobs = static_cast<uint32_t>(options.jobs),
                         .dryRun = options.dryRun};
-  BatchJob job;
+  BatchJob job = NewBatchJob();
   job.destinationFolder = options.dest;
   job.overwrite.prompt = options.overwrite != "replace";
   job.overwrite.skip = options.overwrite == "skip";

@@ -20,7 +20,6 @@ class TerminalPrompts : public Prompts {
   std::optional<std::string> AskPassword(const std::string& path) override;
   bool ConfirmFormat(const std::string&) override { return true; }  // the command line has named it
   bool ConfirmNewFolder(const std::string& folder) override;
-  void StoreFlag(KeyNumber, bool) override {}
 
  private:
   // Prints a question and reads the line typed behind it, without its end and blanks around it; nullopt when there is none.

@@ -1,6 +1,7 @@
 #include "desktop/models/batch/batch_thread.h"
 
 #include "batch/abort.h"
+#include "batch/new_job.h"
 #include "core/choice_lists.h"
 #include "desktop/models/browser/browser_model.h"
 #include "desktop/models/thumbnails/thumbnail.h"
@@ -113,9 +114,6 @@ class BatchThread::Questions : public Prompts {
   bool ConfirmNewFolder(const std::string& folder) override {
     return Confirm(std::string("There is no folder \"").append(folder).append("\". Make it?"), "&Make it");
   }
-  void StoreFlag(KeyNumber key, bool value) override {
-    batch_.Tell([&windows = batch_.windows_, key, value] { windows.StoreFlag(key, value); });
-  }
 
  private:
   bool Confirm(const std::string& question, const std::string& yes) {
@@ -147,6 +145,8 @@ void BatchThread::Start(std::vector<BatchFile> files, BatchFunction function, Ba
 void BatchThread::StartWork(BatchJob job, Work work) {
   if (thread_.joinable()) thread_.join();
   job_ = std::move(job);
+  // The settings belong to the window's thread.
+  job_.remember = [this](Remembered what, int32_t value) { Tell([what, value] { StoreRemembered(what, value); }); };
   running_ = true;
   thread_ = std::thread([this, work = std::move(work)] {
     Box box(*this);

@@ -41,7 +41,6 @@ class BatchWindows {
   virtual std::optional<std::string> AskPassword(const std::string& path) = 0;
   virtual bool ConfirmFormat(const std::string& question) = 0;
   virtual bool Confirm(const std::string& question, const std::string& yes) = 0;
-  virtual void StoreFlag(KeyNumber key, bool value) = 0;
   // After everything else; the thread is about to end.
   virtual void BatchEnded(Status status, const BatchJob& job) = 0;
 };

@@ -1,6 +1,7 @@
 #include "desktop/models/batch/destination_choice.h"
 
 #include "batch/destination_name.h"
+#include "batch/new_job.h"
 #include "core/text.h"
 #include "platform/files.h"
 #include "platform/paths.h"
@@ -56,7 +57,7 @@ std::string FirstDestination(const DestinationChoice& choice, const std::string&
 }
 
 BatchJob JobFor(const DestinationChoice& choice) {
-  BatchJob job;
+  BatchJob job = NewBatchJob();
   job.formatIndex = RowOf(choice.extension);
   job.extension = UpperCase(choice.extension);
   job.destinationFolder = choice.folder;

@@ -4,6 +4,7 @@
 #include <wx/textdlg.h>
 
 #include "batch/abort.h"
+#include "batch/new_job.h"
 #include "batch/turn_run.h"
 #include "desktop/models/batch/destination_choice.h"
 #include "desktop/models/files/previous_file.h"
@@ -173,12 +174,6 @@ bool BatchRunner::Confirm(const std::string& question, const std::string& yes) {
   return dialog.ShowModal() == wxID_OK;
 }
 
-void BatchRunner::StoreFlag(KeyNumber key, bool value) {
-  SettingValue flag;
-  flag.number = value ? 1 : 0;
-  if (StoreSetting(KeyOf(key), flag) != SaveResult::Done) StoreNumber(KeyOf(key), flag.number);
-}
-
 void TurnSelection(Shell& shell, Orientation turn) {
   std::vector<BatchFile> files;
   for (const std::string& file : shell.Tabs().SelectedFiles()) files.push_back({.name = file, .below = {}, .hint = {}});
@@ -188,7 +183,7 @@ void TurnSelection(Shell& shell, Orientation turn) {
   function.keepPrevious = [previous](const std::string& path) { return previous->Keep(path); };
   function.replaced = [previous](const std::string& path) { previous->Replaced(path); };
   shell.Batches().Run(
-      BatchJob(), [files, function](BatchJob& job) { return RunTurn(files, function, job); }, previous);
+      NewBatchJob(), [files, function](BatchJob& job) { return RunTurn(files, function, job); }, previous);
 }
 
 void ConvertSelection(Shell& shell) {

@@ -51,7 +51,6 @@ class BatchRunner : public wxEvtHandler, public BatchWindows {
   std::optional<std::string> AskPassword(const std::string& path) override;
   bool ConfirmFormat(const std::string& question) override;
   bool Confirm(const std::string& question, const std::string& yes) override;
-  void StoreFlag(KeyNumber key, bool value) override;
   void BatchEnded(Status status, const BatchJob& job) override;
   wxWindow* DialogParent() const;
 

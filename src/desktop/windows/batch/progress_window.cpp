@@ -12,6 +12,7 @@
 #include <algorithm>
 #include <cmath>
 
+#include "batch/new_job.h"
 #include "core/choice_lists.h"
 #include "core/text.h"
 #include "desktop/windows/widgets/bitmaps.h"
@@ -116,7 +117,7 @@ ProgressWindow::ProgressWindow(wxWindow* frame, ThumbnailService& thumbnails, Ev
               wxCAPTION | wxRESIZE_BORDER | wxFRAME_FLOAT_ON_PARENT | wxFRAME_NO_TASKBAR, kProgressBoxClass),
       events_(std::move(events)),
       thumbnails_(thumbnails),
-      settings_(ProgressSettingsInForce()),
+      settings_(ProgressSettingsFromSettings()),
       started_(platform::MonotonicSeconds()),
       newsTimer_(this) {
   panel_ = new wxPanel(this);

@@ -1,6 +1,5 @@
 #include "desktop/windows/files/sequential_rename_dialog.h"
 
-#include <wx/app.h>
 #include <wx/button.h>
 #include <wx/checkbox.h>
 #include <wx/combobox.h>
@@ -13,6 +12,7 @@
 
 #include <optional>
 
+#include "batch/new_job.h"
 #include "batch/progress_box.h"
 #include "batch/sequential_rename.h"
 #include "core/plain_name.h"
@@ -54,6 +54,7 @@ struct FlagBox {
   KeyNumber key;
   const char* text;
 };
+enum Flag : size_t { kSkipColliding, kUpdate, kPrefix, kRandom, kHyphen };  // their places in the table
 constexpr FlagBox kFlags[] = {
     {KeyNumber::SequentialRenameSkipCollide, "&Skip colliding files"},
     {KeyNumber::SequentialRenameUpdate, "&Update base number"},
@@ -71,15 +72,15 @@ std::vector<BatchFile> BatchFiles(const std::vector<std::string>& files, size_t 
 class SequentialRenameDialog : public wxDialog {
  public:
   SequentialRenameDialog(wxWindow* parent, const std::vector<std::string>& files);
-  // Whether the user wants it; the settings hold what was chosen then, and are as before otherwise.
-  bool Ask();
+  // The rules that the user chose, which the settings hold then; nullopt, and nothing is changed, when nothing is wanted.
+  std::optional<SequentialRenameRules> Ask();
 
  private:
-  void TakeControls();
+  SequentialRenameRules ReadControls() const;
+  void StoreControls() const;
   void UpdateControls();
 
   const std::vector<std::string>& files_;
-  const Settings before_ = settings;
   wxComboBox* base_ = nullptr;
   wxSpinCtrl* number_ = nullptr;
   wxSpinCtrl* increment_ = nullptr;
@@ -154,28 +155,41 @@ SequentialRenameDialog::SequentialRenameDialog(wxWindow* parent, const std::vect
   base_->SetFocus();
 }
 
-void SequentialRenameDialog::TakeControls() {
+// What the dialog does not show is as the settings say.
+SequentialRenameRules SequentialRenameDialog::ReadControls() const {
+  SequentialRenameRules rules = SequentialRenameRulesFromSettings();
+  rules.baseName = Utf8(base_->GetValue());
+  rules.number = static_cast<uint32_t>(number_->GetValue());
+  rules.increment = static_cast<uint32_t>(increment_->GetValue());
+  rules.skipColliding = flags_[kSkipColliding]->GetValue();
+  rules.update = flags_[kUpdate]->GetValue();
+  rules.numberFirst = flags_[kPrefix]->GetValue();
+  rules.random = flags_[kRandom]->GetValue();
+  rules.separator = flags_[kHyphen]->GetValue() ? std::string(settings.SequentialRenameSep) : std::string();
+  return rules;
+}
+
+void SequentialRenameDialog::StoreControls() const {
   settings.SequentialRenameBaseName.AssignCut(Utf8(base_->GetValue()));
   settings.SequentialRenameBaseNumber = number_->GetValue();
   settings.SequentialRenameIncrement = increment_->GetValue();
   for (size_t i = 0; i < std::size(kFlags); ++i) StoreNumber(KeyOf(kFlags[i].key), flags_[i]->GetValue() ? 1 : 0);
+  (void)AddToHistoryList(HistoryList::RenameBases, settings.SequentialRenameBaseName);
+  (void)SaveConfiguration();
 }
 
 // The new names as a run would give them now; nothing is renamed.
 void SequentialRenameDialog::UpdateControls() {
   const std::string base = Utf8(base_->GetValue());
-  base_->Enable(!flags_[2]->GetValue());  // with the number in front every file keeps its own name behind it
+  base_->Enable(!flags_[kPrefix]->GetValue());  // with the number in front every file keeps its own name behind it
   const bool plain = IsPlainName(base) && !base.empty();
-  ok_->Enable(plain || flags_[2]->GetValue());
+  ok_->Enable(plain || flags_[kPrefix]->GetValue());
   if (!plain) return problem_->SetLabel("The base name is a part of a file name.");
-  TakeControls();
   PreviewBox box;
   BatchJob job;
   job.box = &box;
-  job.rename = SequentialRenameFromSettings();
   const std::vector<BatchFile> files = BatchFiles(files_, kMostPreviewed);
-  RunRename(files, {.seed = 1, .dryRun = true, .storeNumber = [](uint32_t) {}}, job);
-  settings.SequentialRenameBaseNumber = number_->GetValue();
+  RunRename(files, {.rules = ReadControls(), .seed = 1, .dryRun = true}, job);
   preview_->Freeze();
   preview_->DeleteAllItems();
   size_t failed = 0;
@@ -190,14 +204,10 @@ void SequentialRenameDialog::UpdateControls() {
   problem_->SetLabel(failed == 0 ? wxString() : wxString::Format("%zu of the files shown cannot get a new name.", failed));
 }
 
-bool SequentialRenameDialog::Ask() {
-  if (ShowModal() != wxID_OK) {
-    settings = before_;
-    return false;
-  }
-  TakeControls();
-  (void)AddToHistoryList(HistoryList::RenameBases, settings.SequentialRenameBaseName);
-  return true;
+std::optional<SequentialRenameRules> SequentialRenameDialog::Ask() {
+  if (ShowModal() != wxID_OK) return std::nullopt;
+  StoreControls();
+  return ReadControls();
 }
 
 // What the last run renamed, for the frame's undo.
@@ -214,19 +224,10 @@ void RenameSelectionSequentially(Shell& shell) {
   if (files.empty()) return;
   SequentialRenameDialog dialog(&shell.Window(), files);
   LogEvent("prompt", "sequential-rename");
-  if (!dialog.Ask()) return;
-  (void)SaveConfiguration();
-  RenameOptions options;
-  options.storeNumber = [](uint32_t next) {
-    wxTheApp->CallAfter([next] {
-      SettingValue number;
-      number.number = static_cast<int32_t>(next);
-      (void)StoreSetting(KeyOf(KeyNumber::SequentialRenameBaseNumber), number);
-    });
-  };
-  BatchJob job;
-  job.rename = SequentialRenameFromSettings();
-  shell.Batches().Run(std::move(job), [batch = BatchFiles(files, files.size()), options, &shell](BatchJob& running) {
+  const std::optional<SequentialRenameRules> rules = dialog.Ask();
+  if (!rules) return;
+  const RenameOptions options{.rules = *rules};
+  shell.Batches().Run(NewBatchJob(), [batch = BatchFiles(files, files.size()), options, &shell](BatchJob& running) {
     RunRename(batch, options, running);
     shell.Window().CallAfter([&shell] { NoteRenames(shell); });
     return Status::Ok;

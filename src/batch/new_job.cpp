@@ -1,0 +1,95 @@
+#include "batch/new_job.h"
+
+#include <algorithm>
+
+#include "settings/configuration.h"
+#include "settings/job_options.h"
+#include "settings/key_table.h"
+#include "settings/settings.h"
+
+namespace fotomill {
+
+namespace {
+
+struct FunctionPrefix {
+  FileFunction function;
+  SettingPrefix Settings::*key;
+};
+constexpr FunctionPrefix kPrefixes[] = {
+    {FileFunction::Annotate, &Settings::PrefixAnnotate},   {FileFunction::Catalog, &Settings::PrefixCatalog},
+    {FileFunction::Crop, &Settings::PrefixCrop},           {FileFunction::Effects, &Settings::PrefixEffects},
+    {FileFunction::Filter, &Settings::PrefixFilter},       {FileFunction::Matt, &Settings::PrefixMatt},
+    {FileFunction::Transform, &Settings::PrefixTransform}, {FileFunction::Watermark, &Settings::PrefixWatermark},
+};
+
+OverwritePolicy OverwritePolicyFromSettings() {
+  return {.prompt = settings.PromptBeforeOverwrite != 0,
+          .keepBoth = settings.OverwriteKeepBoth != 0,
+          .recycle = settings.OverwritePromptRecycle != 0,
+          .previews = settings.OverwritePromptPreviews != 0};
+}
+
+NamingOptions NamingOptionsFromSettings() {
+  NamingOptions naming{.extensionCase = settings.ExtensionCaseStyle,
+                       .askName = settings.PromptForDestName != 0,
+                       .beside = settings.DestForceSourceDir != 0,
+                       .askPassword = settings.PasswordProtect != 0,
+                       .confirmFormat = settings.WarnDestinationWrite != 0,
+                       .firstVariant = settings.NumberedVariantMin,
+                       .lastVariant = settings.NumberedVariantMax};
+  for (const auto& [function, key] : kPrefixes) naming.prefixes[static_cast<size_t>(function)] = settings.*key;
+  return naming;
+}
+
+KeyNumber NumberOf(Remembered what) {
+  switch (what) {
+    case Remembered::PromptBeforeOverwrite: return KeyNumber::PromptBeforeOverwrite;
+    case Remembered::OverwriteKeepBoth: return KeyNumber::OverwriteKeepBoth;
+    case Remembered::OverwriteRecycle: return KeyNumber::OverwritePromptRecycle;
+    case Remembered::OverwritePreviews: return KeyNumber::OverwritePromptPreviews;
+    case Remembered::NextRenameNumber: break;
+  }
+  return KeyNumber::SequentialRenameBaseNumber;
+}
+
+}  // namespace
+
+BatchJob NewBatchJob() {
+  BatchJob job;
+  job.overwrite = OverwritePolicyFromSettings();
+  job.naming = NamingOptionsFromSettings();
+  job.reduction = ReduceOptionsFromSettings();
+  job.boxSettings = ProgressSettingsFromSettings();
+  job.historyFunctions = static_cast<uint32_t>(settings.FileHistoryFunctions);
+  job.writeComments = WritesCommentsFromSettings();
+  job.remember = StoreRemembered;
+  return job;
+}
+
+ProgressSettings ProgressSettingsFromSettings() {
+  return {.closeWhenDone = settings.CloseProgressWhenDone != 0,
+          .optimizeWindow = settings.ProgressOptimizeWindow != 0,
+          .thumbnails = settings.ProgressThumbnails != 0,
+          .showMissingThumbnails = settings.ProgressShowMissingThumbnails != 0};
+}
+
+SequentialRenameRules SequentialRenameRulesFromSettings() {
+  return {.baseName = std::string(settings.SequentialRenameBaseName),
+          .number = static_cast<uint32_t>(std::max(settings.SequentialRenameBaseNumber, 0)),
+          .increment = static_cast<uint32_t>(std::max(settings.SequentialRenameIncrement, 1)),
+          .maxAttempts = static_cast<uint32_t>(std::max(settings.SequentialRenameMaxAttempts, 1)),
+          .separator = settings.SequentialRenameHyphen != 0 ? std::string(settings.SequentialRenameSep) : std::string(),
+          .numberFirst = settings.SequentialRenamePrefix != 0,
+          .skipColliding = settings.SequentialRenameSkipCollide != 0,
+          .update = settings.SequentialRenameUpdate != 0,
+          .random = settings.SequentialRenameRandom != 0};
+}
+
+void StoreRemembered(Remembered what, int32_t value) {
+  const KeyRow& row = KeyOf(NumberOf(what));
+  SettingValue stored;
+  stored.number = value;
+  if (StoreSetting(row, stored) != SaveResult::Done) StoreNumber(row, value);
+}
+
+}  // namespace fotomill
