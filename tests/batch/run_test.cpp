@@ -118,6 +118,35 @@ TEST_F(Run, FunctionsPutTheirPrefixInFrontBeforeNamesCollide) {
   }
 }
 
+TEST_F(Run, AnOutputThatFailedLeavesItsNameToTheNext) {
+  fs::create_directory(In("two"));
+  WriteBytes(In("a.bmp"), BitmapFile(70000, 1, 24));  // too wide for JPEG
+  WriteBytes(In("two/a.bmp"), BitmapFile(8, 8, 24));
+  const std::vector<BatchFile> files{{In("a.bmp"), {}, Status::Ok, {}}, {In("two/a.bmp"), {}, Status::Ok, {}}};
+  for (const uint32_t jobs : {1u, 4u}) {
+    fs::remove_all(In("out"));
+    BatchJob job = NewJob();
+    job.formatIndex = FindFormatByName("x.jpg");
+    ASSERT_EQ(RunBatch(files, {.jobs = jobs}, job), Status::Ok);
+    EXPECT_EQ(job.progress.Lines()[0].item.status, Status::UnsuitableImage);
+    EXPECT_EQ(job.progress.Lines()[1].text, In("two/a.bmp") + " -> " + In("out/a.jpg"));
+  }
+}
+
+TEST_F(Run, AVariantMayBeTooLongWhereItsNameWasNot) {
+  fs::create_directory(In("out"));
+  const std::string base(260 - In("out/.pcx").size(), 'n');
+  const BatchFile file{In(base + ".bmp"), {}, Status::Ok, {}};
+  WriteBytes(file.name, BitmapFile(8, 8, 24));
+  WriteText(In("out/" + base + ".pcx"), "old");
+  BatchJob job = NewJob();
+  job.applyToRest = true;  // keep both
+  ASSERT_EQ(RunBatch({&file, 1}, {}, job), Status::Ok);
+  EXPECT_EQ(job.progress.Lines()[0].item.status, Status::InvalidDestination);
+  EXPECT_THAT(job.progress.Lines()[0].text, testing::EndsWith(" Its path would be longer than 260 characters."));
+  EXPECT_EQ(Outputs().size(), 1u);
+}
+
 TEST_F(Run, ASourceWaitsForTheOutputThatTakesItsPlace) {
   // Each file's output is the next one's source, and replaces it: the last output holds the first picture.
   for (const uint32_t jobs : {1u, 4u}) {

@@ -76,21 +76,29 @@ TEST(Turn, FilesChangeOnlyWhereNothingIsLost) {
   }
 }
 
-TEST(Turn, ACommentThatWouldGoKeepsTheFileAsItIs) {
+TEST(Turn, AFileThatWouldLoseItsTextsStaysAsItIs) {
   const ScopedSettings scoped;
   const TemporaryFolder folder;
-  const PicturePointer picture = PatternPicture(9, 5, 24);
-  picture->comment = {'h', 'i'};
-  const std::vector<uint8_t> file = Encode(PngWrite, *picture);
+  const PicturePointer commented = PatternPicture(9, 5, 24), tagged = PatternPicture(9, 5, 24);
+  commented->comment = {'h', 'i'};
+  tagged->metadata.xmp = {'<', 'x', '/', '>'};
+  const struct {
+    const PicturePointer& picture;
+    const char* hint;
+  } rows[] = {{commented, "Its comment would be lost."}, {tagged, "Its EXIF, XMP or color profile would be lost."}};
   const std::string path = folder.Path("a.png");
-  for (const bool kept : {false, true}) {
-    SCOPED_TRACE(kept);
-    settings.PreserveEXIF = kept;
-    WriteBytes(path, file);
-    const TurnedFile turned = TurnPictureFile(path, path, {.turn = Orientation::QuarterRight}, {});
-    EXPECT_EQ(turned.status, kept ? Status::Ok : Status::UnsuitableImage);
-    EXPECT_EQ(turned.hint, kept ? "" : "Its comment would be lost.");
-    EXPECT_EQ(ReadBytes(path) == file, !kept);
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.hint);
+    settings.PreserveEXIF = 1;
+    const std::vector<uint8_t> file = Encode(PngWrite, *row.picture);
+    for (const bool kept : {false, true}) {
+      settings.PreserveEXIF = kept;
+      WriteBytes(path, file);
+      const TurnedFile turned = TurnPictureFile(path, path, {.turn = Orientation::QuarterRight}, {});
+      EXPECT_EQ(turned.status, kept ? Status::Ok : Status::UnsuitableImage);
+      EXPECT_EQ(turned.hint, kept ? "" : row.hint);
+      EXPECT_EQ(ReadBytes(path) == file, !kept);
+    }
   }
 }
 

@@ -100,6 +100,8 @@ TEST_F(FileHistory, IsLimitedByCountOrByDays) {
   settings.FileHistoryWindowCount = 3;
   EXPECT_TRUE(Record(File("old"), 0, 1000));
   EXPECT_THAT(List(), ElementsAre("f24 0 -76", "f23 0 -77", "f22 0 -78"));
+  EXPECT_TRUE(Record(File("old"), 0, 10));  // comes back after it was cut off
+  EXPECT_THAT(List(), ElementsAre("old 0 -10", "f24 0 -76", "f23 0 -77"));
   settings.FileHistoryWindowType = choice::kLimitDays;
   EXPECT_TRUE(Record(File("limit"), 0, 30 * 86400));
   EXPECT_TRUE(Record(File("beyond"), 0, 30 * 86400 + 1));

@@ -65,6 +65,7 @@ TEST(IniFile, ChangesOnlyWhatIsAskedFor) {
       {"new key in an empty section", set, "[Fotomill]\r\n", "[Fotomill]\r\nKey=new\r\n"},
       {"new key behind a line without end", set, "[Fotomill]\nA=1", "[Fotomill]\nA=1\nKey=new\n"},
       {"new key behind half a line end", set, "[Fotomill]\nA=1\r", "[Fotomill]\nA=1\r\nKey=new\n"},
+      {"the other half of CR LF", set, "[Fotomill]\r\nA=1\r", "[Fotomill]\r\nA=1\r\nKey=new\r\n"},
       {"new section behind others", set, "[Other]\r\nA=1", "[Other]\r\nA=1\r\n[Fotomill]\r\nKey=new\r\n"},
       {"new file", set, "", "[Fotomill]\nKey=new\n"},
       {"one old, one new", two, "[Fotomill]\nKey=old\n", "[Fotomill]\nKey=new\nZeta=9\n"},

@@ -46,6 +46,12 @@ FMW_EXPORT int32_t FMW_CALL PLUGIN11GetInfo(FMW_PICTURE_INFO* info, const char* 
 #if defined(GARBAGE_SIZES)
   info->width = -2147483647;
   info->bitsPerPixel = 999;
+#elif defined(ODD_DEPTH)
+  info->bitsPerPixel = 12;
+#elif defined(OLDER)
+  info->version -= 1; /* typeName is not filled */
+  info->background = 0x7f102030;
+  info->width = 3; /* one more than there is */
 #elif defined(ERROR_NUMBER)
   *error = 25;
   return 0;
@@ -63,6 +69,14 @@ FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN11ReadImage(const char* fileName, int32_t* 
   (void)fileName;
   (void)error;
   (void)services;
+#if defined(LOADS_ANOTHER)
+  if (strstr(fileName, "inner") == 0) {
+    char inner[300];
+    snprintf(inner, sizeof inner, "%.*sinner.odd", (int)(strrchr(fileName, '/') + 1 - fileName), fileName);
+    services->freePicture(services->loadPicture(inner, error));
+    services->progressStep(1, 2);
+  }
+#endif
   block[0] = 40;
   block[4] = 2;
   block[8] = 1;
@@ -80,7 +94,7 @@ FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN11ReadImage(const char* fileName, int32_t* 
   return block;
 }
 
-#if defined(HALF_WRITER)
+#if defined(HALF_WRITER) || defined(SILENT_WRITER)
 FMW_EXPORT int32_t FMW_CALL PLUGIN11WriteImage(const char* fileName, FMW_HANDLE bitmap, const char* comment,
                                                int32_t* error, const FMW_HOST_SERVICES* services) {
   FILE* file = fopen(fileName, "wb");
@@ -89,7 +103,10 @@ FMW_EXPORT int32_t FMW_CALL PLUGIN11WriteImage(const char* fileName, FMW_HANDLE 
   (void)services;
   fputs("half", file);
   fclose(file);
-  *error = 11;
+#if defined(HALF_WRITER)
+  *error = 10;
+#endif
+  (void)error;
   return 0;
 }
 #endif

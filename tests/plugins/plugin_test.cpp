@@ -103,6 +103,7 @@ TEST_F(Plugins, WhatAModuleReturnsIsChecked) {
   const Row rows[] = {
       {"GARBAGE_SIZES", Status::DamagedFile},     {"ERROR_NUMBER", Status::InvalidPassword}, {"SMALL_BLOCK", Status::DamagedFile},
       {"WRONG_DEPTH", Status::UnsupportedFormat}, {"EMPTY_RESULT", Status::DamagedFile},     {"HALF_WRITER", Status::Ok},
+      {"ODD_DEPTH", Status::DamagedFile},
   };
   const std::string file = folder_.Path("x.odd");
   test::WriteText(file, "anything");
@@ -116,17 +117,50 @@ TEST_F(Plugins, WhatAModuleReturnsIsChecked) {
 }
 
 TEST_F(Plugins, AFailedWriteLeavesTheDestinationAlone) {
-  EnablePlugins(OddFolder("HALF_WRITER"));
-  const std::string file = folder_.Path("x.odd");
-  test::WriteText(file, "before");
+  struct Row {
+    const char* module;
+    Status status;
+  };
+  for (const Row& row : {Row{"HALF_WRITER", Status::ErrorCreatingFile}, {"SILENT_WRITER", Status::ErrorWritingFile}}) {
+    SCOPED_TRACE(row.module);
+    EnablePlugins(OddFolder(row.module));
+    const std::string file = folder_.Path("x.odd");
+    test::WriteText(file, "before");
+    PicturePointer picture;
+    ASSERT_EQ(LoadPicture(file.c_str(), picture), Status::Ok);
+    EXPECT_EQ(picture->typeName.view(), std::string(64, 'T'));
+    EXPECT_EQ(picture->image.PixelAt(0, 0), 0x0000ff);
+    EXPECT_EQ(picture->image.PixelAt(1, 0), 0xff0000);
+    EXPECT_EQ(WritePicture(*picture, file, {}), row.status);
+    EXPECT_EQ(test::ReadText(file), "before");
+    EXPECT_EQ(folder_.Names(), std::vector<std::string>{"x.odd"});
+  }
+}
+
+TEST_F(Plugins, OlderModulesFillLess) {
+  EnablePlugins(OddFolder("OLDER"));
+  test::WriteText(folder_.Path("x.odd"), "");
   PicturePointer picture;
-  ASSERT_EQ(LoadPicture(file.c_str(), picture), Status::Ok);
-  EXPECT_EQ(picture->typeName.view(), std::string(64, 'T'));
-  EXPECT_EQ(picture->image.PixelAt(0, 0), 0x0000ff);
-  EXPECT_EQ(picture->image.PixelAt(1, 0), 0xff0000);
-  EXPECT_EQ(WritePicture(*picture, file, {}), Status::ErrorWritingFile);
-  EXPECT_EQ(test::ReadText(file), "before");
-  EXPECT_EQ(folder_.Names(), std::vector<std::string>{"x.odd"});
+  ASSERT_EQ(LoadPicture(folder_.Path("x.odd").c_str(), picture), Status::Ok);
+  EXPECT_EQ(picture->typeName.view().find('T'), std::string_view::npos);
+  EXPECT_EQ(picture->background, 0x102030u);
+  EXPECT_EQ(picture->width, 2);
+}
+
+TEST_F(Plugins, ProgressIsThatOfTheOuterCallAgainAfterAnInnerOne) {
+  class Sink : public ProgressSink {
+   public:
+    void Step(int32_t done, int32_t total) override { steps.push_back({done, total}); }
+    std::vector<std::pair<int32_t, int32_t>> steps;
+  };
+  EnablePlugins(OddFolder("LOADS_ANOTHER"));
+  for (const char* name : {"x.odd", "inner.odd"}) test::WriteText(folder_.Path(name), "");
+  PicturePointer picture;
+  ASSERT_EQ(LoadPictureInfo(folder_.Path("x.odd").c_str(), picture), Status::Ok);
+  Sink sink;
+  picture->progress = &sink;
+  EXPECT_EQ(ReadPicture(*picture), Status::Ok);
+  EXPECT_EQ(sink.steps, (std::vector<std::pair<int32_t, int32_t>>{{1, 2}}));
 }
 
 TEST_F(Plugins, AModuleWithoutWriterIsReadOnly) {

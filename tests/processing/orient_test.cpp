@@ -1,5 +1,7 @@
 #include "processing/geometry/orient.h"
 
+#include <algorithm>
+
 #include "processing/pictures.h"
 #include "processing/promote.h"
 
@@ -50,7 +52,7 @@ TEST(Orient, TwoTurnsAreOne) {
 TEST(Orient, UndoneByItsInverseAtEveryDepth) {
   constexpr int32_t kInverse[] = {0, 1, 2, 3, 4, 5, 8, 7, 6};
   for (const int32_t bits : {1, 4, 8, 24}) {
-    for (const auto& [width, height] : {std::pair{1, 1}, {1, 70}, {70, 1}, {33, 65}, {100, 31}}) {
+    for (const auto& [width, height] : {std::pair{1, 1}, {1, 70}, {70, 1}, {33, 65}, {100, 31}, {150, 260}}) {
       for (int32_t orientation = 1; orientation <= 8; ++orientation) {
         SCOPED_TRACE(testing::Message() << bits << " bits, " << width << " x " << height << ", " << orientation);
         const uint32_t colors = bits == 24 ? 0x1000000 : 1u << bits;
@@ -62,9 +64,11 @@ TEST(Orient, UndoneByItsInverseAtEveryDepth) {
         ASSERT_EQ(PackFewColors(*picture, bits, packed), Status::Ok);
         test::AddAlpha(*picture, [](int32_t x, int32_t y) { return (x * 3 + y * 7) & 255; });
         const std::vector<uint32_t> before = Colors(*picture);
+        const std::vector<uint8_t> table(picture->image.ColorTable().begin(), picture->image.ColorTable().end());
         ASSERT_EQ(OrientPicture(*picture, static_cast<Orientation>(orientation)), Status::Ok);
         ASSERT_EQ(OrientPicture(*deep, static_cast<Orientation>(orientation)), Status::Ok);
         EXPECT_EQ(Colors(*picture), Colors(*deep));
+        EXPECT_TRUE(std::ranges::equal(picture->image.ColorTable(), table));
         EXPECT_EQ(picture->alpha.Width(), picture->image.Width());
         EXPECT_EQ(picture->width, picture->image.Width());
         ASSERT_EQ(OrientPicture(*picture, static_cast<Orientation>(kInverse[orientation])), Status::Ok);

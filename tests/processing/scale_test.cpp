@@ -240,6 +240,9 @@ TEST(Scale, TransparentColorsLeaveNoFringe) {
       int32_t seen = 0;
       for (int32_t y = 0; y < size.height; ++y) {
         for (int32_t x = 0; x < size.width; ++x) {
+          if (filter != ScaleFilter::Nearest && picture->alpha.PixelAt(x, y) == 0) {
+            ASSERT_EQ(picture->image.PixelAt(x, y), 0) << x << ", " << y;
+          }
           if (picture->alpha.PixelAt(x, y) < 16) continue;
           ++seen;
           for (int c = 0; c < 3; ++c) {
