@@ -4,6 +4,13 @@
 // VECTOR_AVX2_END is compiled for AVX2 where the build knows it (VECTOR_HAS_AVX2 is 1), and may be called when
 // HasAvx2() says so. Nothing that the baseline uses too, such as a header of the standard library, may be included there.
 
+// In front of a loop that writes an element and reads others only further on: it may be done several elements at a time.
+#if defined(__clang__)
+#define VECTOR_READS_AHEAD _Pragma("clang loop vectorize(assume_safety)")
+#else
+#define VECTOR_READS_AHEAD _Pragma("GCC ivdep")
+#endif
+
 #if defined(__x86_64__)
 #include <immintrin.h>
 #define VECTOR_HAS_AVX2 1

@@ -1,5 +1,7 @@
 #include "operations/operations.h"
+#include "processing/filters/box_blur.h"
 #include "processing/filters/gaussian.h"
+#include "processing/filters/rank.h"
 
 // Filters: what becomes of a pixel depends on its neighbors.
 namespace fotomill {
@@ -33,6 +35,22 @@ Status Unsharp(PictureRecord& picture, const Arguments& arguments, const Operati
                         PlaceOf(context), context.work);
 }
 
+constexpr Parameter kRadius = {.name = "radius", .kind = kInteger, .unit = "px", .preset = "1", .least = 0,
+                               .most = kMostRankRadius, .label = "Radius",
+                               .help = "A square of twice as many pixels and one more on each side counts."};
+constexpr Parameter kWindow[] = {kRadius};
+static_assert(kMostBoxRadius >= kMostRankRadius);
+
+int32_t Radius(const Arguments& arguments) { return arguments.Integer("radius"); }
+
+Status BoxBlur(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+  return BoxBlurPicture(picture, Radius(arguments), context.work);
+}
+template <Rank rank>
+Status ApplyRank(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+  return RankPicture(picture, rank, Radius(arguments), context.work);
+}
+
 constexpr Operation kOperations[] = {
     {.name = "blur", .family = Family::Filter, .label = "Gaussian blur", .help = "Blurs a picture evenly.", .example = "blur 2",
      .parameters = kBlur, .works = Works::Neighborhood, .apply = Blur, .reach = Reach},
@@ -41,6 +59,18 @@ constexpr Operation kOperations[] = {
     {.name = "unsharp", .family = Family::Filter, .label = "Unsharp mask",
      .help = "Sharpens by adding the difference to a blurred copy.", .example = "unsharp 1.5 0.8 threshold=3",
      .parameters = kUnsharp, .works = Works::Neighborhood, .apply = Unsharp, .reach = Reach},
+    {.name = "box-blur", .family = Family::Filter, .label = "Box blur",
+     .help = "Replaces each pixel by the mean of a square around it.", .example = "box-blur 3", .parameters = kWindow,
+     .works = Works::Neighborhood, .apply = BoxBlur, .reach = Radius},
+    {.name = "median", .family = Family::Filter, .label = "Median",
+     .help = "Replaces each pixel by the median of a square around it: removes specks and keeps edges.", .example = "median 2",
+     .parameters = kWindow, .works = Works::Neighborhood, .apply = ApplyRank<Rank::Median>, .reach = Radius},
+    {.name = "minimum", .family = Family::Filter, .label = "Minimum",
+     .help = "Replaces each pixel by the darkest level of a square around it: dark parts grow.", .example = "minimum 2",
+     .parameters = kWindow, .works = Works::Neighborhood, .apply = ApplyRank<Rank::Minimum>, .reach = Radius},
+    {.name = "maximum", .family = Family::Filter, .label = "Maximum",
+     .help = "Replaces each pixel by the brightest level of a square around it: bright parts grow.", .example = "maximum 2",
+     .parameters = kWindow, .works = Works::Neighborhood, .apply = ApplyRank<Rank::Maximum>, .reach = Radius},
 };
 
 }  // namespace
