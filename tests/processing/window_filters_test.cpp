@@ -67,14 +67,13 @@ TEST(WindowFilters, AreWhatTheyAreCalled) {
   struct Row {
     int32_t width, height, radius;
   };
-  constexpr Row kRows[] = {{1, 1, 3}, {2, 1, 0}, {7, 5, 1}, {40, 3, 2}, {3, 90, 4}, {33, 21, 12}, {300, 70, 1}, {20, 20, 127}};
+  constexpr Row kRows[] = {{1, 1, 3}, {2, 1, 0}, {7, 5, 1}, {40, 3, 2}, {3, 90, 4}, {33, 21, 12}, {300, 70, 1}, {3, 2, 127}};
   for (const Row& row : kRows) {
     for (const bool noise : {true, false}) {
       const auto colorAt = [&](int32_t x, int32_t y) {
         return noise ? Scatter(x, y) & 0xffffff : static_cast<uint32_t>(x / 9 * 0x160B05 + y / 4 * 0x010203) & 0xffffff;
       };
       for (const Filter& filter : kFilters) {
-        if (row.radius > 100 && &filter != &kFilters[0] && noise) continue;  // the definition takes its time
         SCOPED_TRACE(std::string(filter.name) + " " + std::to_string(row.width) + " " + std::to_string(row.radius));
         const PicturePointer picture = MakePicture(row.width, row.height, colorAt);
         const std::vector<uint32_t> expected = Expected(filter, *picture, row.radius);
