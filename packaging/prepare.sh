@@ -95,9 +95,17 @@ Configure() {
   }
 }
 
+# What is compiled is kept in ccache's own folder or CCACHE_DIR; in build/ where that folder cannot be written.
+ChooseCache() {
+  local folder
+  [[ -z ${CCACHE_DIR:-} ]] && folder=$(ccache --get-config cache_dir 2>/dev/null) || return 0
+  mkdir -p "$folder" 2>/dev/null && [[ -w $folder ]] || export CCACHE_DIR=$root/build/ccache
+}
+
 # Build PRESET [TARGET...]: the errors are shown, the rest is in the preset's build.log; a terminal sees how far it is.
 Build() {
   local folder=$root/build/$1 line
+  ChooseCache
   (shift; exec ninja -C "$folder" "$@") 2>&1 9>&- | tee "$folder/build.log" | while read -r line; do
     [[ -t 2 && $line == '['* ]] && printf '\r%s \r' "${line%%]*}]" >&2
   done

@@ -1,0 +1,135 @@
+#!/usr/bin/env python3
+"""Figures of the sources that are watched but break nothing.
+
+metrics.py [-v] [PROJECT] prints how many public declarations in headers carry a comment, the longest include chain, and how
+many lines outside of tables are wider than 100 columns; -v names the places too. A declaration is a function, a type, an
+alias or a constant that a header of src/ shows at namespace level or as a public method. Its comment stands directly above
+or behind it.
+"""
+import re
+import sys
+from pathlib import Path
+
+COLUMNS = 100
+AIM_COMMENTED, AIM_CHAIN = 85, 9
+INCLUDE = re.compile(r'^\s*#\s*include\s*"([^"]+)"', re.MULTILINE)
+SCOPE = re.compile(r"^(namespace\b|extern \"C\")")
+TYPE = re.compile(r"^(template\s*<.*>\s*)?(class|struct|union|enum( class)?)\s+\w+[^;()]*\{")
+# What the language asks for, and what the base or the line above has said already.
+SILENT = re.compile(r"^(friend\b|using namespace\b|[\w:]+;|(class|struct|enum class) [\w:]+(?: : \w+)?;|#|explicit operator bool)"
+                    r"|= (delete|default)|\boverride\b|\boperator=|^~|^virtual ~|^(explicit )?(\w+)\(const \3&\)")
+TABLE = re.compile(r'^\s*[{"|(]|^\s*[A-Z_0-9]+\(')
+
+
+def without_strings(line):
+    return re.sub(r'"(\\.|[^"\\])*"|\'(\\.|[^\'\\])\'', '""', line)
+
+
+def declarations(text):
+    """Each public declaration of a header as (line number, text, whether it has a comment)."""
+    scopes = []  # of each open brace: "namespace", "public", "private" (of a class) or "body"
+    above = False  # the line before was a comment
+    pending, start, commented = "", 0, False
+    for number, raw in enumerate(text.splitlines(), 1):
+        line = raw.strip()
+        if not pending and not line:
+            above = False
+        if line.startswith("//"):
+            above = True
+            continue
+        code, _, remark = without_strings(line).partition("//")
+        code = code.strip()
+        if not code or code.startswith("#"):
+            continue
+        inside = scopes[-1] if scopes else "namespace"
+        access = re.match(r"(public|protected|private):", code)
+        if access and inside in ("public", "private"):
+            scopes[-1] = "public" if access[1] == "public" else "private"
+            above = False
+            continue
+        if not pending:
+            start, commented = number, above
+        commented = commented or bool(remark)
+        pending = f"{pending} {code}".strip()
+        if inside == "body" or pending.startswith("}"):
+            balance(scopes, code, "body")
+            pending = ""
+            continue
+        if not re.search(r"[;{}]\s*(,)?$", code):
+            continue
+        if not SCOPE.match(pending) and is_declaration(pending, inside):
+            yield start, pending, commented
+            above = False
+        kind = "body"
+        if SCOPE.match(pending):
+            kind = "namespace"
+        elif TYPE.match(pending) and "enum" not in pending.split("{")[0]:
+            kind = "private" if re.match(r"(template\s*<.*>\s*)?class\b", pending) else "public"
+        balance(scopes, pending, kind)
+        pending = ""
+
+
+def balance(scopes, code, kind):
+    for letter in code:
+        if letter == "{":
+            scopes.append(kind)
+            kind = "body"
+        elif letter == "}" and scopes:
+            scopes.pop()
+
+
+def is_declaration(code, inside):
+    if inside not in ("namespace", "public") or SILENT.search(code):
+        return False
+    return inside == "namespace" or "(" in code.split("=")[0] or bool(TYPE.match(code))
+
+
+def longest_chain(source):
+    """The longest way down from a file by its includes, files named from src/."""
+    includes = {path.relative_to(source).as_posix(): INCLUDE.findall(path.read_text(encoding="utf-8"))
+                for path in source.rglob("*") if path.suffix in {".h", ".cpp"}}
+    known = {}
+
+    def chain(name):
+        if name not in known:
+            known[name] = [name]  # a circle ends here; the house test names it
+            below = [chain(target) for target in includes[name] if target in includes]
+            known[name] = [name] + max(below, key=len, default=[])
+        return known[name]
+
+    return max(map(chain, sorted(includes)), key=len, default=[])
+
+
+def wide_lines(project):
+    for folder in ("src", "tests", "fuzz", "bench", "samples"):
+        for path in sorted((project / folder).rglob("*")):
+            if path.suffix in {".h", ".cpp", ".c", ".py", ".sh"}:
+                for number, line in enumerate(path.read_text(encoding="utf-8").splitlines(), 1):
+                    if len(line) > COLUMNS and not TABLE.match(line):
+                        yield f"{path.relative_to(project).as_posix()}:{number}"
+
+
+def main():
+    arguments = sys.argv[1:]
+    verbose = "-v" in arguments
+    names = [argument for argument in arguments if argument != "-v"]
+    project = Path(names[0]) if names else Path(__file__).resolve().parents[2]
+    found = [(path.relative_to(project).as_posix(), *declaration) for path in sorted((project / "src").rglob("*.h"))
+             for declaration in declarations(path.read_text(encoding="utf-8"))]
+    bare = [row for row in found if not row[3]]
+    chain = longest_chain(project / "src")
+    wide = list(wide_lines(project))
+    if verbose:
+        for name, number, code, _ in bare:
+            print(f"{name}:{number}: no comment: {code[:80]}")
+        print("longest chain: " + "\n  > ".join(chain))
+        for place in wide:
+            print(f"{place}: wider than {COLUMNS} columns")
+    share = 100 * (len(found) - len(bare)) / max(1, len(found))
+    print(f"{share:.1f} % of {len(found)} header declarations have a comment (aim {AIM_COMMENTED})")
+    print(f"{len(chain)} files in the longest include chain (aim {AIM_CHAIN})")
+    print(f"{len(wide)} lines outside of tables are wider than {COLUMNS} columns (aim 0 in new code)")
+
+
+if __name__ == "__main__":
+    main()
