@@ -5,6 +5,7 @@
 #include "core/data_folder.h"
 #include "platform/clock.h"
 #include "platform/files.h"
+#include "settings/job_options.h"
 #include "settings/settings.h"
 #include "support/scratch_file.h"
 
@@ -34,16 +35,16 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
   settings.FileHistoryFunctions = 0xfffff;
   settings.FileHistoryWindowType = size & 1;
   ClearFileHistory();
-  Require(platform::WriteWholeFile(FileHistoryPath(), {reinterpret_cast<const char*>(data), size}));
-  if (!LoadFileHistory()) return 0;
+  Require(platform::WriteWholeFile(FileHistoryPath(HistoryOptionsFromSettings()), {reinterpret_cast<const char*>(data), size}));
+  if (!LoadFileHistory(HistoryOptionsFromSettings())) return 0;
   const std::vector<std::string> list = List();
   for (size_t i = 1; i < list.size(); ++i) Require(FileHistoryAt(i - 1).accessed >= FileHistoryAt(i).accessed);
-  if (!SaveFileHistory()) return 0;
-  (void)LoadFileHistory();
+  if (!SaveFileHistory(HistoryOptionsFromSettings())) return 0;
+  (void)LoadFileHistory(HistoryOptionsFromSettings());
   Require(List() == list);
   ClearFileHistory();
   const FileUse use{picture, FileFunction::View, kOwnTime, INT32_MAX, false};
-  if (UpdateFileHistory({&use, 1}) != HistoryUpdate::Done) return 0;
-  Require(LoadFileHistory() && FileHistoryAt(0).accessed == INT32_MAX);
+  if (UpdateFileHistory(HistoryOptionsFromSettings(), {&use, 1}) != HistoryUpdate::Done) return 0;
+  Require(LoadFileHistory(HistoryOptionsFromSettings()) && FileHistoryAt(0).accessed == INT32_MAX);
   return 0;
 }

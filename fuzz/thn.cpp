@@ -23,8 +23,8 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
   if (bitmap.Empty()) Require(NewPackedImage(180, 180, nullptr, 24, bitmap) == Status::Ok);
   // Enlarging says little about the input and takes most of the time.
   const uint32_t flags = data[size / 2] & (size % 64 == 0 ? 0xff : ~kDrawLargeView);
-  Require(DrawThumbnailRecord(bitmap, any, static_cast<int8_t>(data[size - 1]), 0, flags));
+  Require(DrawThumbnailRecord(bitmap, any, static_cast<int8_t>(data[size - 1]), 0, flags, {}));
   ThumbnailRecord again;
-  Require(WriteThumbnailFile(record, path) && ReadThumbnailFile(again, path) && again.bytes == record.bytes);
+  Require(WriteThumbnailFile(record, path, true) && ReadThumbnailFile(again, path) && again.bytes == record.bytes);
   return 0;
 }

@@ -2,9 +2,13 @@
 
 #include <algorithm>
 
+#include "catalog/history/file_history.h"
+#include "catalog/thumbnails/thumbnail_update.h"
 #include "metadata/exif/exif_text.h"
 #include "metadata/gps.h"
 #include "processing/palette/reduce.h"
+#include "settings/configuration.h"
+#include "settings/key_table.h"
 #include "settings/settings.h"
 
 namespace fotomill {
@@ -37,6 +41,40 @@ choice::DistanceUnit DistanceUnitFromSettings() {
 }
 
 bool GpsLocationFromSettings(GpsLocation& location) { return ParseGpsLocation(settings.ExifDefaultLocation, location); }
+
+HistoryOptions HistoryOptionsFromSettings() {
+  return {.on = settings.FileHistoryEnable != 0,
+          .offForGood = !IsForThisRun(KeyOf(KeyNumber::FileHistoryEnable)),
+          .functions = static_cast<uint32_t>(settings.FileHistoryFunctions),
+          .limitDays = settings.FileHistoryWindowType == choice::kLimitDays,
+          .days = settings.FileHistoryWindowDays,
+          .count = settings.FileHistoryWindowCount,
+          .name = std::string(settings.FileHistoryDatabase)};
+}
+
+ThumbnailOptions ThumbnailOptionsFromSettings() {
+  return {.quick = settings.ThumbnailQuickResize != 0,
+          .matte = static_cast<Color>(settings.ThumbnailMatte),
+          .hidden = settings.WriteHiddenThumbnails != 0,
+          .fromFiles = settings.AlwaysUseTHN != 0,
+          .fromSystem = settings.UseWindowsThumbnailCache != 0,
+          .keep = settings.AutoCreateThumbnail != 0,
+          .fastZoom = settings.FastZoomedThumbnails != 0,
+          .zoomFilter = settings.ThumbnailZoomFilter};
+}
+
+ThumbnailUpdateOptions ThumbnailUpdateOptionsFromSettings() {
+  return {.offers = settings.UpdateThumbnailsFlag != 0,
+          .choice = settings.UpdateThumbnailsOptions,
+          .compacts = settings.UseThumbnailCompacting != 0,
+          .compactionDays = settings.ThumbnailCompactInterval,
+          .making = ThumbnailOptionsFromSettings()};
+}
+
+void StoreThumbnailUpdate(const ThumbnailUpdateOptions& options) {
+  settings.UpdateThumbnailsOptions = options.choice;
+  if (!options.offers) settings.UpdateThumbnailsFlag = 0;
+}
 
 bool WritesCommentsFromSettings() { return settings.WriteFileComments != 0; }
 

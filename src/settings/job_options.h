@@ -6,7 +6,10 @@ namespace fotomill {
 
 struct ExifTextOptions;
 struct GpsLocation;
+struct HistoryOptions;
 struct ReduceOptions;
+struct ThumbnailOptions;
+struct ThumbnailUpdateOptions;
 
 // What a job needs of the settings in force, as the small structs that its subjects define. Filled once, where a job begins,
 // on the thread that the settings belong to; the job then runs with its own copy, whatever is changed meanwhile.
@@ -21,6 +24,12 @@ ExifTextOptions ExifTextOptionsFromSettings();
 choice::DistanceUnit DistanceUnitFromSettings();
 // ExifDefaultLocation. False, with `location` at zero, when it holds no location.
 [[nodiscard]] bool GpsLocationFromSettings(GpsLocation& location);
+
+HistoryOptions HistoryOptionsFromSettings();
+ThumbnailOptions ThumbnailOptionsFromSettings();
+ThumbnailUpdateOptions ThumbnailUpdateOptionsFromSettings();
+// Takes up what the user chose in the offer to update thumbnails.
+void StoreThumbnailUpdate(const ThumbnailUpdateOptions& options);
 
 // WriteFileComments.
 bool WritesCommentsFromSettings();

@@ -8,6 +8,7 @@
 #include "core/choice_lists.h"
 #include "core/data_folder.h"
 #include "platform/clock.h"
+#include "settings/job_options.h"
 #include "support/child.h"
 #include "support/faults.h"
 #include "support/files.h"
@@ -58,7 +59,7 @@ class FileHistory : public testing::Test {
   }
   std::vector<std::string> Stored() const {
     ClearFileHistory();
-    LoadFileHistory();
+    LoadFileHistory(HistoryOptionsFromSettings());
     return List();
   }
 
@@ -67,14 +68,14 @@ class FileHistory : public testing::Test {
 };
 
 bool Record(const std::string& path, int function, int64_t before, int32_t created = kOwnTime) {
-  return RecordFileHistory(path, static_cast<FileFunction>(function), created, static_cast<int32_t>(kNow - before));
+  return RecordFileHistory(HistoryOptionsFromSettings(), path, static_cast<FileFunction>(function), created, static_cast<int32_t>(kNow - before));
 }
 
 TEST_F(FileHistory, RefreshesAnEntryAndKeepsItsSizeAndBirth) {
   const std::string a = File("a", 3);
   EXPECT_TRUE(Record(a, 9, 50, 1234));
   WriteText(a, "longer than before");
-  EXPECT_TRUE(RecordFileHistory(a, FileFunction::View));
+  EXPECT_TRUE(RecordFileHistory(HistoryOptionsFromSettings(), a, FileFunction::View));
   EXPECT_THAT(List(), ElementsAre("a 0 0"));
   EXPECT_EQ(FileHistoryAt(0).size, 3u);
   EXPECT_EQ(FileHistoryAt(0).created, 1234);
@@ -145,11 +146,11 @@ TEST_F(FileHistory, RefusesWhatItCannotKeep) {
     SCOPED_TRACE(row.name);
     ClearFileHistory();
     settings.FileHistoryFunctions = row.mask;
-    EXPECT_EQ(RecordFileHistory(row.path, static_cast<FileFunction>(row.function)), row.recorded);
+    EXPECT_EQ(RecordFileHistory(HistoryOptionsFromSettings(), row.path, static_cast<FileFunction>(row.function)), row.recorded);
     const FileUse use{row.path, static_cast<FileFunction>(row.function)};
-    EXPECT_EQ(UpdateFileHistory({&use, 1}), HistoryUpdate::Done);
+    EXPECT_EQ(UpdateFileHistory(HistoryOptionsFromSettings(), {&use, 1}), HistoryUpdate::Done);
     if (!row.recorded) continue;
-    EXPECT_TRUE(LoadFileHistory());
+    EXPECT_TRUE(LoadFileHistory(HistoryOptionsFromSettings()));
     EXPECT_EQ(FileHistoryAt(0).path, row.path);
     std::filesystem::remove(Store());
   }
@@ -159,7 +160,7 @@ TEST_F(FileHistory, WritesItsLinesToTheByte) {
   const std::string path = folder_.Path("data/a");
   WriteText(path, "");
   EXPECT_TRUE(Record(path, 9, 0));
-  EXPECT_TRUE(SaveFileHistory());
+  EXPECT_TRUE(SaveFileHistory(HistoryOptionsFromSettings()));
   EXPECT_EQ(FileHistoryCount(), 0u);
   std::vector<uint8_t> wanted = Hex("09 50 41 54 48 3A  # tab PATH:");
   wanted.insert(wanted.end(), path.begin(), path.end());
@@ -207,29 +208,29 @@ TEST_F(FileHistory, ReadsLinesAsTheyCome) {
 
 TEST_F(FileHistory, LeavesAloneWhatItCannotRead) {
   const FileUse use{File("a"), FileFunction::View};
-  EXPECT_EQ(UpdateFileHistory({&use, 1}), HistoryUpdate::Done);
+  EXPECT_EQ(UpdateFileHistory(HistoryOptionsFromSettings(), {&use, 1}), HistoryUpdate::Done);
   for (const std::string text : {"a letter to my aunt\n", "\x89PNG\r\n"}) {
     WriteText(Store(), text);
-    EXPECT_FALSE(LoadFileHistory());
-    EXPECT_EQ(UpdateFileHistory({&use, 1}), HistoryUpdate::NotRead);
+    EXPECT_FALSE(LoadFileHistory(HistoryOptionsFromSettings()));
+    EXPECT_EQ(UpdateFileHistory(HistoryOptionsFromSettings(), {&use, 1}), HistoryUpdate::NotRead);
     EXPECT_EQ(ReadText(Store()), text);
   }
   std::filesystem::resize_file(Store(), (16u << 20) + 1);
-  EXPECT_EQ(UpdateFileHistory({&use, 1}), HistoryUpdate::NotRead);
+  EXPECT_EQ(UpdateFileHistory(HistoryOptionsFromSettings(), {&use, 1}), HistoryUpdate::NotRead);
   EXPECT_EQ(std::filesystem::file_size(Store()), (16u << 20) + 1);
-  EXPECT_FALSE(SaveFileHistory()) << "nothing was loaded";
+  EXPECT_FALSE(SaveFileHistory(HistoryOptionsFromSettings())) << "nothing was loaded";
   EXPECT_TRUE(std::filesystem::exists(Store()));
   settings.FileHistoryDatabase = SettingName("../elsewhere");
-  EXPECT_EQ(UpdateFileHistory({&use, 1}), HistoryUpdate::Failed);
+  EXPECT_EQ(UpdateFileHistory(HistoryOptionsFromSettings(), {&use, 1}), HistoryUpdate::Failed);
 }
 
 TEST_F(FileHistory, SwitchedOffIsDeletedAtTheNextSave) {
   const FileUse use{File("a"), FileFunction::View};
-  EXPECT_EQ(UpdateFileHistory({&use, 1}), HistoryUpdate::Done);
+  EXPECT_EQ(UpdateFileHistory(HistoryOptionsFromSettings(), {&use, 1}), HistoryUpdate::Done);
   settings.FileHistoryEnable = 0;
-  EXPECT_FALSE(LoadFileHistory());
+  EXPECT_FALSE(LoadFileHistory(HistoryOptionsFromSettings()));
   EXPECT_TRUE(std::filesystem::exists(Store()));
-  EXPECT_TRUE(SaveFileHistory());
+  EXPECT_TRUE(SaveFileHistory(HistoryOptionsFromSettings()));
   EXPECT_FALSE(std::filesystem::exists(Store()));
 }
 
@@ -259,7 +260,7 @@ TEST_F(FileHistory, SlotsHoldTheThumbnailsOfTheirFiles) {
   const auto put = [&](const std::string& name, uint8_t value) {
     ThumbnailRecord record;
     record.Fill(value * 0x010101u);
-    ASSERT_TRUE(WriteThumbnailFile(record, folder_.Path(name + ".THN")));
+    ASSERT_TRUE(WriteThumbnailFile(record, folder_.Path(name + ".THN"), true));
   };
   const auto shown = [&](size_t index) {
     const ThumbnailRecord* const record = FileHistoryThumbnail(index);
@@ -284,13 +285,13 @@ TEST_F(FileHistory, SlotsHoldTheThumbnailsOfTheirFiles) {
 
 TEST_F(FileHistory, FaultsLoseNothingThatWasThere) {
   const FileUse first{File("a"), FileFunction::View, kOwnTime, static_cast<int32_t>(kNow - 9)};
-  EXPECT_EQ(UpdateFileHistory({&first, 1}), HistoryUpdate::Done);
+  EXPECT_EQ(UpdateFileHistory(HistoryOptionsFromSettings(), {&first, 1}), HistoryUpdate::Done);
   const std::string old = ReadText(Store());
   const FileUse second{File("b"), FileFunction::Convert};
   const int64_t faults = ForEachFault([&] {
     WriteText(Store(), old);
     size_t recorded = 0;
-    const HistoryUpdate result = UpdateFileHistory({&second, 1}, &recorded);
+    const HistoryUpdate result = UpdateFileHistory(HistoryOptionsFromSettings(), {&second, 1}, &recorded);
     const int64_t left = platform::faultCountdown.exchange(0);
     const std::vector<std::string> stored = Stored();
     if (result == HistoryUpdate::Done && recorded == 1) {
@@ -310,7 +311,7 @@ TEST_F(FileHistory, TwoProcessesKeepEachOthersEntries) {
   const auto recordHalf = [&](size_t from) {
     for (size_t i = from; i < files.size(); i += 2) {
       const FileUse use{files[i], FileFunction::View};
-      if (UpdateFileHistory({&use, 1}) != HistoryUpdate::Done) _exit(1);
+      if (UpdateFileHistory(HistoryOptionsFromSettings(), {&use, 1}) != HistoryUpdate::Done) _exit(1);
     }
   };
   const pid_t child = fork();
@@ -327,14 +328,14 @@ TEST_F(FileHistory, TwoProcessesKeepEachOthersEntries) {
 
 TEST_F(FileHistory, AFullDiskLeavesTheOldFile) {
   const FileUse first{File("a"), FileFunction::View};
-  EXPECT_EQ(UpdateFileHistory({&first, 1}), HistoryUpdate::Done);
+  EXPECT_EQ(UpdateFileHistory(HistoryOptionsFromSettings(), {&first, 1}), HistoryUpdate::Done);
   const std::string old = ReadText(Store());
   const FileUse second{File("b"), FileFunction::Convert};
   const int status = InChild([&] {
     signal(SIGXFSZ, SIG_IGN);
     const rlimit limit{10, 10};
     setrlimit(RLIMIT_FSIZE, &limit);
-    _exit(UpdateFileHistory({&second, 1}) == HistoryUpdate::Failed ? 0 : 1);
+    _exit(UpdateFileHistory(HistoryOptionsFromSettings(), {&second, 1}) == HistoryUpdate::Failed ? 0 : 1);
   });
   EXPECT_EQ(status, 0);
   EXPECT_EQ(ReadText(Store()), old);

@@ -11,13 +11,11 @@
 #include "catalog/thumbnails/thumbnail_file.h"
 #include "core/md5.h"
 #include "formats/png/png.h"
-#include "settings/settings.h"
 #include "support/bitmaps.h"
 #include "support/codecs.h"
 #include "support/files.h"
 #include "support/pictures.h"
 #include "support/scoped_environment.h"
-#include "support/scoped_settings.h"
 
 namespace fotomill::test {
 namespace {
@@ -37,7 +35,6 @@ PackedImage Canvas(int32_t side) {
 }
 
 TEST(DrawThumbnail, FillsTheSquareOfItsFlags) {
-  const ScopedSettings keep;
   ThumbnailRecord record = Flat(0);
   for (int32_t i = 0; i < 3; ++i) {  // two white pixels in the top left corner, one in the bottom right
     record.StoredRow(95)[i] = record.StoredRow(94)[3 + i] = record.StoredRow(0)[95 * 3 + i] = 255;
@@ -65,12 +62,11 @@ TEST(DrawThumbnail, FillsTheSquareOfItsFlags) {
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.name);
-    settings.FastZoomedThumbnails = row.fast;
-    settings.ThumbnailZoomFilter = choice::kNearest;
+    const ThumbnailOptions options{.fastZoom = row.fast != 0, .zoomFilter = choice::kNearest};
     EXPECT_EQ(DrawnThumbnailSide(row.record, row.flags), row.side);
     PackedImage canvas = Canvas(180);
     std::ranges::fill(canvas.Rows(), uint8_t{7});
-    ASSERT_TRUE(DrawThumbnailRecord(canvas, row.record, 1, 2, row.flags));
+    ASSERT_TRUE(DrawThumbnailRecord(canvas, row.record, 1, 2, row.flags, options));
     EXPECT_EQ(canvas.PixelAt(1, 2), row.topLeft * 0x010101);
     EXPECT_EQ(canvas.PixelAt(row.side, row.side + 1), row.bottomRight * 0x010101);
     EXPECT_EQ(canvas.PixelAt(row.side + 1, 2), 0x070707);
@@ -78,9 +74,8 @@ TEST(DrawThumbnail, FillsTheSquareOfItsFlags) {
     EXPECT_EQ(canvas.PixelAt(0, 2), 0x070707);
   }
   // 176 of 96: the second pixel covers the first old one to 11 - 6 parts of 6.
-  settings.FastZoomedThumbnails = 1;
   PackedImage canvas = Canvas(176);
-  ASSERT_TRUE(DrawThumbnailRecord(canvas, record, 0, 0, kDrawLargeView));
+  ASSERT_TRUE(DrawThumbnailRecord(canvas, record, 0, 0, kDrawLargeView, {.fastZoom = true}));
   EXPECT_EQ(canvas.PixelAt(1, 0), (255 * 5 + 3) / 6 * 0x010101);
 }
 
@@ -88,25 +83,23 @@ TEST(DrawThumbnail, TurnsGrayTermByTermAndClips) {
   ThumbnailRecord record;
   record.Fill(0x3264ff);  // blue 50, green 100, red 255
   PackedImage canvas = Canvas(10);
-  ASSERT_TRUE(DrawThumbnailRecord(canvas, record, -90, 5, kDrawGray));
+  ASSERT_TRUE(DrawThumbnailRecord(canvas, record, -90, 5, kDrawGray, {}));
   EXPECT_EQ(canvas.PixelAt(5, 5), (76 + 59 + 5) * 0x010101);
   EXPECT_EQ(canvas.PixelAt(6, 5), 0);
   EXPECT_EQ(canvas.PixelAt(5, 4), 0);
   for (const int32_t far : {INT32_MIN, -96, 10, INT32_MAX}) {
-    ASSERT_TRUE(DrawThumbnailRecord(canvas, Flat(9), far, far, 0));
+    ASSERT_TRUE(DrawThumbnailRecord(canvas, Flat(9), far, far, 0, {}));
     EXPECT_EQ(canvas.PixelAt(0, 0) + canvas.PixelAt(9, 0) + canvas.PixelAt(9, 9), 0);
   }
   PackedImage indexed;
   ASSERT_EQ(NewPackedImage(96, 96, nullptr, 8, indexed), Status::Ok);
-  EXPECT_FALSE(DrawThumbnailRecord(indexed, record, 0, 0, 0));
+  EXPECT_FALSE(DrawThumbnailRecord(indexed, record, 0, 0, 0, {}));
 }
 
 TEST(DrawThumbnail, PlaceholdersAreTwoPicturesOnTheMatte) {
-  const ScopedSettings keep;
-  settings.ThumbnailMatte = 0x332211;
   ThumbnailRecord notMade, unreadable, other = Flat(1);
-  ASSERT_TRUE(MakePlaceholderRecord(notMade, 9501) && MakePlaceholderRecord(unreadable, 9502));
-  EXPECT_FALSE(MakePlaceholderRecord(other, 9503));
+  ASSERT_TRUE(MakePlaceholderRecord(notMade, 9501, 0x332211) && MakePlaceholderRecord(unreadable, 9502, 0x332211));
+  EXPECT_FALSE(MakePlaceholderRecord(other, 9503, 0x332211));
   EXPECT_EQ(other.bytes, Flat(1).bytes);
   EXPECT_NE(notMade.bytes, unreadable.bytes);
   for (const ThumbnailRecord& record : {notMade, unreadable}) {
@@ -169,10 +162,8 @@ class Lookup : public testing::Test {
 };
 
 TEST_F(Lookup, TakesTheSystemsThumbnailWhileItIsValid) {
-  const ScopedSettings keep;
-  settings.ThumbnailMatte = 0xabcdef;
   LargeThumbnailRecord record;
-  EXPECT_FALSE(ReadSystemThumbnail(picture_, record));
+  EXPECT_FALSE(ReadSystemThumbnail(picture_, 0xabcdef, record));
   const struct {
     const char* name;
     int64_t late;
@@ -187,7 +178,7 @@ TEST_F(Lookup, TakesTheSystemsThumbnailWhileItIsValid) {
   for (const auto& row : rows) {
     SCOPED_TRACE(row.name);
     PutSystemThumbnail(row.late, row.uri, row.width);
-    EXPECT_EQ(ReadSystemThumbnail(picture_, record), row.valid);
+    EXPECT_EQ(ReadSystemThumbnail(picture_, 0xabcdef, record), row.valid);
   }
   EXPECT_TRUE(record.HasMagic("tHNL"));
   // 176 x 88 in the middle: rows 44 to 131.
@@ -199,13 +190,12 @@ TEST_F(Lookup, TakesTheSystemsThumbnailWhileItIsValid) {
   std::filesystem::copy(folder_.Path("cache/thumbnails/large"), folder_.Path("cache/thumbnails/x-large"));
   EXPECT_NE(ReadSystemPicture(picture_, 257), nullptr);
   PutSystemThumbnail(0, FileUri(picture_), 100);
-  ASSERT_TRUE(ReadSystemThumbnail(picture_, record));
+  ASSERT_TRUE(ReadSystemThumbnail(picture_, 0xabcdef, record));
   EXPECT_THAT(record.StoredRow(38).subspan(37 * 3, 3), testing::ElementsAre(0xab, 0xcd, 0xef));
   EXPECT_THAT(record.StoredRow(38).subspan(38 * 3, 3), testing::Not(testing::ElementsAre(0xab, 0xcd, 0xef)));
 }
 
 TEST_F(Lookup, AsksWhereTheModeSays) {
-  const ScopedSettings keep;
   ThumbnailDatabase database;
   ASSERT_EQ(database.OpenThumbnailDatabase(folder_.Path("Fotomill.tdb"), true), ThumbnailDatabase::Opened::Done);
   const DatabaseRecord stored{Flat(3), picture_, VolumeKeyFor(picture_), false};
@@ -235,17 +225,16 @@ TEST_F(Lookup, AsksWhereTheModeSays) {
     SCOPED_TRACE(row.name);
     std::filesystem::remove(ThumbnailPathFor(picture_));
     ThumbnailRecord file = Flat(1);
-    ASSERT_TRUE(!row.hasFile || WriteThumbnailFile(file, ThumbnailPathFor(picture_)));
-    settings.AlwaysUseTHN = row.alwaysFile;
-    settings.UseWindowsThumbnailCache = row.useCache;
+    ASSERT_TRUE(!row.hasFile || WriteThumbnailFile(file, ThumbnailPathFor(picture_), true));
+    const ThumbnailOptions options{.fromFiles = row.alwaysFile != 0, .fromSystem = row.useCache != 0};
     ThumbnailSources sources{row.mode, true, [&](std::string_view name) { return name == "a b.bmp" ? &listed : nullptr; },
-                             &database};
+                             &database, options};
     const auto record = std::make_unique<AnyThumbnailRecord>();
     ASSERT_EQ(LookUpThumbnail(picture_, row.large, sources, *record), row.found != kNone);
     const bool large = std::holds_alternative<LargeThumbnailRecord>(*record);
     EXPECT_EQ(large, row.found == kSystem);
     EXPECT_TRUE(large || row.found == kNone || std::get<ThumbnailRecord>(*record).bytes[300] == row.found);
-    sources = {row.mode, false, {}, nullptr};
+    sources = {row.mode, false, {}, nullptr, options};
     EXPECT_EQ(LookUpThumbnail(picture_, row.large, sources, *record),
               row.hasFile && (row.mode == choice::kDiskBased || row.alwaysFile != 0));
   }

@@ -6,7 +6,6 @@
 
 #include "catalog/thumbnails/thumbnail_file.h"
 #include "formats/jpeg/jpeg.h"
-#include "settings/settings.h"
 #include "support/bitmaps.h"
 #include "support/codecs.h"
 #include "support/command_line.h"
@@ -14,7 +13,6 @@
 #include "support/files.h"
 #include "support/hex.h"
 #include "support/pictures.h"
-#include "support/scoped_settings.h"
 
 namespace fotomill::test {
 namespace {
@@ -43,10 +41,8 @@ std::vector<uint8_t> Head(const ThumbnailRecord& record, size_t count) {
 }
 
 TEST(ThumbnailRecord, IsLaidOutToTheByte) {
-  const ScopedSettings keep;
-  settings.ThumbnailMatte = kMatte;
   ThumbnailRecord record;
-  ASSERT_TRUE(MakeThumbnailRecord(record, *Plain(10, 20, 1, 2, 3)));
+  ASSERT_TRUE(MakeThumbnailRecord(record, *Plain(10, 20, 1, 2, 3), {.matte = kMatte}));
   std::vector<uint8_t> wanted = Hex("54 48 4E 4C   # THNL\n 00 02  # version 512");
   wanted.resize(264);                                                            // reserved
   for (int i = 0; i < 24; ++i) wanted.insert(wanted.end(), {0x33, 0x22, 0x11});  // blue, green, red of the matte
@@ -55,7 +51,6 @@ TEST(ThumbnailRecord, IsLaidOutToTheByte) {
 }
 
 TEST(ThumbnailRecord, PlacesPicturesInTheMiddle) {
-  const ScopedSettings keep;
   const struct {
     const char* name;
     int32_t width, height;
@@ -71,10 +66,8 @@ TEST(ThumbnailRecord, PlacesPicturesInTheMiddle) {
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.name);
-    settings.ThumbnailQuickResize = row.quick;
-    settings.ThumbnailMatte = kMatte;
     ThumbnailRecord record;
-    ASSERT_TRUE(MakeThumbnailRecord(record, *Plain(row.width, row.height, 200, 100, 50)));
+    ASSERT_TRUE(MakeThumbnailRecord(record, *Plain(row.width, row.height, 200, 100, 50), {.quick = row.quick != 0, .matte = kMatte}));
     for (int32_t r = 0; r < 96; ++r) {
       for (int32_t x = 0; x < 96; ++x) {
         const bool inside = x >= row.left && x <= row.right && r >= row.bottom && r <= row.top;
@@ -89,7 +82,7 @@ TEST(ThumbnailRecord, KeepsRowsUpright) {
   PicturePointer picture = Plain(96, 96, 0, 0, 0);
   SetPixel(picture->image, 0, 0, 0xffffff);  // top left
   ThumbnailRecord record;
-  ASSERT_TRUE(MakeThumbnailRecord(record, *picture));
+  ASSERT_TRUE(MakeThumbnailRecord(record, *picture, {}));
   EXPECT_EQ(PixelOf(record, 0, 95), Hex("FF FF FF"));
   EXPECT_EQ(PixelOf(record, 0, 0), Hex("00 00 00"));
   PackedImage bitmap;
@@ -109,8 +102,8 @@ TEST(ThumbnailRecord, IsTheSameFromAReducedDecode) {
   const TemporaryFolder folder;
   WriteBytes(folder.Path("a.jpg"), Encode(JpegWrite, *picture));
   ThumbnailRecord reduced, full;
-  ASSERT_EQ(MakeThumbnailOfFile(folder.Path("a.jpg"), reduced), Status::Ok);
-  ASSERT_TRUE(MakeThumbnailRecord(full, *picture));
+  ASSERT_EQ(MakeThumbnailOfFile(folder.Path("a.jpg"), {}, reduced), Status::Ok);
+  ASSERT_TRUE(MakeThumbnailRecord(full, *picture, {}));
   int largest = 0;
   for (size_t i = kThumbnailHeaderSize; i < full.bytes.size(); ++i)
     largest = std::max(largest, std::abs(full.bytes[i] - reduced.bytes[i]));
@@ -118,13 +111,11 @@ TEST(ThumbnailRecord, IsTheSameFromAReducedDecode) {
 }
 
 TEST(ThumbnailRecord, BlendsAlpha) {
-  const ScopedSettings keep;
-  settings.ThumbnailMatte = 0x0000ff;  // red
   PicturePointer picture = Plain(96, 96, 255, 101, 0);
   ASSERT_EQ(NewAlphaPlane(96, 96, picture->alpha), Status::Ok);
   std::ranges::fill(picture->alpha.Rows(), 128);
   ThumbnailRecord record;
-  ASSERT_TRUE(MakeThumbnailRecord(record, *picture));
+  ASSERT_TRUE(MakeThumbnailRecord(record, *picture, {.matte = 0x0000ff}));  // red
   EXPECT_EQ(PixelOf(record, 50, 50), (std::vector<uint8_t>{128, 51, 127}));
   ASSERT_TRUE(MakeBlendedThumbnailRecord(record, *picture, 0x00ff65));  // blue 0, green 255, red 101
   // 255 x 128 / 255; 255 x 127 / 255 + 101 x 128 / 255; 101 x 127 / 255, each rounded down
@@ -193,11 +184,11 @@ TEST(ThumbnailFile, IsWrittenInOneStep) {
   const TemporaryFolder folder;
   const std::string path = folder.Path("a.THN");
   ThumbnailRecord old, record;
-  ASSERT_TRUE(WriteThumbnailFile(old, path));
-  ASSERT_TRUE(MakeThumbnailRecord(record, *Plain(5, 5, 1, 2, 3)));
+  ASSERT_TRUE(WriteThumbnailFile(old, path, true));
+  ASSERT_TRUE(MakeThumbnailRecord(record, *Plain(5, 5, 1, 2, 3), {}));
   const int64_t faults = ForEachFault([&] {
     WriteBytes(path, old.bytes);
-    const bool written = WriteThumbnailFile(record, path);
+    const bool written = WriteThumbnailFile(record, path, true);
     const std::vector<uint8_t> bytes = ReadBytes(path);
     const auto& wanted = written ? record.bytes : old.bytes;
     EXPECT_EQ(bytes, std::vector<uint8_t>(wanted.begin(), wanted.end()));
@@ -206,13 +197,13 @@ TEST(ThumbnailFile, IsWrittenInOneStep) {
   EXPECT_GT(faults, 2);
   // A protected file is replaced, a link is too, and what it leads to stays.
   ASSERT_EQ(chmod(path.c_str(), 0400), 0);
-  EXPECT_TRUE(WriteThumbnailFile(record, path));
+  EXPECT_TRUE(WriteThumbnailFile(record, path, true));
   WriteText(folder.Path("precious"), "precious");
   std::filesystem::create_symlink(folder.Path("precious"), folder.Path("b.THN"));
-  EXPECT_TRUE(WriteThumbnailFile(record, folder.Path("b.THN")));
+  EXPECT_TRUE(WriteThumbnailFile(record, folder.Path("b.THN"), true));
   EXPECT_EQ(ReadText(folder.Path("precious")), "precious");
-  EXPECT_FALSE(WriteThumbnailFile(record, folder.Path("none/a.THN")));
-  EXPECT_FALSE(WriteThumbnailFile(record, folder.Path()));
+  EXPECT_FALSE(WriteThumbnailFile(record, folder.Path("none/a.THN"), true));
+  EXPECT_FALSE(WriteThumbnailFile(record, folder.Path(), true));
 }
 
 class ThumbsCommand : public testing::Test {

@@ -4,10 +4,8 @@
 
 #include "platform/clock.h"
 #include "platform/volumes.h"
-#include "settings/settings.h"
 #include "support/bitmaps.h"
 #include "support/files.h"
-#include "support/scoped_settings.h"
 
 namespace fotomill::test {
 namespace {
@@ -36,6 +34,8 @@ class Face : public ThumbnailUpdateFace {
     return 1;
   }
   void Refresh() override { refreshed = true; }
+  void KeepChoice(const ThumbnailUpdateOptions&) override { kept = true; }
+  bool kept = false;
 
   bool goesOn = true, refreshed = false;
   int32_t answer = 0, count = -1, selected = -1;
@@ -51,7 +51,7 @@ class ThumbnailUpdate : public testing::Test {
     platform::FixNow(kNow);
     for (const char* name : {"a.bmp", "b.bmp", ".c.bmp"}) WriteBytes(folder_.Path(name), BitmapFile(3, 3, 24));
     for (const char* name : {"a.THN", "gone.THN", "B.thn.txt"}) WriteText(folder_.Path(name), "");
-    settings.UseThumbnailCompacting = 1;
+    browser_.options.compacts = true;
     browser_.folder = folder_.Path();
     browser_.files = {"a.bmp", "b.bmp", ".c.bmp"};
   }
@@ -62,7 +62,6 @@ class ThumbnailUpdate : public testing::Test {
   bool HasOrphan() const { return std::filesystem::exists(folder_.Path("gone.THN")); }
 
   static inline DriveKind kind;
-  ScopedSettings keep_;
   TemporaryFolder folder_;
   ThumbnailBrowser browser_;
   Face face_;
@@ -95,7 +94,7 @@ TEST_F(ThumbnailUpdate, IsOfferedWhereItMakesSense) {
     browser.view = row.view;
     browser.asks = row.asks;
     kind = row.drive;
-    settings.UpdateThumbnailsFlag = row.flag;
+    browser.options.offers = row.flag != 0;
     Face face;
     EXPECT_EQ(OfferThumbnailUpdate(browser, face), row.offered);
     EXPECT_EQ(face.count, row.offered ? 2 : -1);
@@ -108,23 +107,23 @@ TEST_F(ThumbnailUpdate, IsOfferedWhereItMakesSense) {
 TEST_F(ThumbnailUpdate, TakesTheAnswer) {
   const struct {
     int32_t stored, selected, answer, storedAfter, flagAfter;
-    bool asksAfter, builds;
+    bool asksAfter, builds, keeps;
   } rows[] = {
-      {102, 102, 101, 101, 1, true, true},  {7, 101, 102, 102, 1, true, false}, {102, 102, 103, 102, 1, false, false},
-      {105, 101, 104, 104, 0, true, false}, {103, 103, 0, 103, 1, true, false},
+      {102, 102, 101, 101, 1, true, true, true},  {7, 101, 102, 102, 1, true, false, true}, {102, 102, 103, 102, 1, false, false, false},
+      {105, 101, 104, 104, 0, true, false, true}, {103, 103, 0, 103, 1, true, false, false},
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.answer);
-    settings.UpdateThumbnailsOptions = row.stored;
-    settings.UpdateThumbnailsFlag = 1;
     ThumbnailBrowser browser = browser_;
+    browser.options.choice = row.stored;
     Face face;
     face.answer = row.answer;
     EXPECT_TRUE(OfferThumbnailUpdate(browser, face));
     EXPECT_EQ(face.progress, "Scanning " + browser.folder);
     EXPECT_EQ(face.selected, row.selected);
-    EXPECT_EQ(settings.UpdateThumbnailsOptions, row.storedAfter);
-    EXPECT_EQ(settings.UpdateThumbnailsFlag, row.flagAfter);
+    EXPECT_EQ(browser.options.choice, row.storedAfter);
+    EXPECT_EQ(browser.options.offers, row.flagAfter != 0);
+    EXPECT_EQ(face.kept, row.keeps);
     EXPECT_EQ(browser.asks, row.asksAfter);
     EXPECT_EQ(face.refreshed, row.builds);
     EXPECT_EQ(face.built, row.builds ? (std::vector<std::string>{"b.bmp", ".c.bmp"}) : std::vector<std::string>());
@@ -138,16 +137,15 @@ TEST_F(ThumbnailUpdate, TakesTheAnswer) {
 }
 
 TEST_F(ThumbnailUpdate, RemovesOrphansOnceInAWhile) {
-  settings.ThumbnailCompactInterval = 30;
   browser_.lastCompaction = kNow - 30 * kDay;
   EXPECT_FALSE(IsCompactionDue(browser_));
   --browser_.lastCompaction;
   EXPECT_TRUE(IsCompactionDue(browser_));
   browser_.compacts = false;
   EXPECT_FALSE(IsCompactionDue(browser_));
-  settings.UseThumbnailCompacting = 0;
+  browser_.options.compacts = false;
   EXPECT_FALSE(RemoveOrphanThumbnails(browser_));
-  settings.UseThumbnailCompacting = 1;
+  browser_.options.compacts = true;
   kind = DriveKind::Optical;
   EXPECT_FALSE(RemoveOrphanThumbnails(browser_));
   EXPECT_TRUE(HasOrphan());

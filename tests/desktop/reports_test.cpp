@@ -20,6 +20,7 @@
 #include "platform/files.h"
 #include "registry/registry.h"
 #include "settings/configuration.h"
+#include "settings/job_options.h"
 #include "settings/settings.h"
 #include "support/codecs.h"
 #include "support/exif_blocks.h"
@@ -156,7 +157,7 @@ TEST_F(Reports, HistorySortsRemovesAndForgets) {
   const FileUse uses[] = {{Sample("a10.bmp"), FileFunction::Convert, 300, 100},
                           {Sample("a2.bmp"), FileFunction::View, 100, 300},
                           {Sample("B.bmp"), FileFunction::Crop, 200, 200}};
-  ASSERT_EQ(UpdateFileHistory(uses), HistoryUpdate::Done);
+  ASSERT_EQ(UpdateFileHistory(HistoryOptionsFromSettings(), uses), HistoryUpdate::Done);
   FileHistoryList list;
   EXPECT_TRUE(list.Take());
   const auto names = [&] {
@@ -175,21 +176,21 @@ TEST_F(Reports, HistorySortsRemovesAndForgets) {
   EXPECT_EQ(list.Cell(1, choice::kColumnPath), folder_.Path() + "/");
 
   const FileUse later{Sample("c.bmp"), FileFunction::Crop};
-  ASSERT_EQ(UpdateFileHistory({&later, 1}), HistoryUpdate::Done);
+  ASSERT_EQ(UpdateFileHistory(HistoryOptionsFromSettings(), {&later, 1}), HistoryUpdate::Done);
   EXPECT_TRUE(list.Remove({0, 2}));
   EXPECT_THAT(names(), ElementsAre("B.bmp"));
-  EXPECT_THAT(test::ReadText(FileHistoryPath()),
+  EXPECT_THAT(test::ReadText(FileHistoryPath(HistoryOptionsFromSettings())),
               testing::AllOf(HasSubstr("B.bmp"), HasSubstr("c.bmp"), testing::Not(HasSubstr("a2"))));
   EXPECT_TRUE(list.Clear());
-  EXPECT_FALSE(platform::FileExists(FileHistoryPath()));
-  test::WriteText(FileHistoryPath(), "no history at all");
+  EXPECT_FALSE(platform::FileExists(FileHistoryPath(HistoryOptionsFromSettings())));
+  test::WriteText(FileHistoryPath(HistoryOptionsFromSettings()), "no history at all");
   EXPECT_FALSE(list.Take());
 }
 
 TEST_F(Reports, CompactionTellsWhatItDid) {
   const std::string path = folder_.Path("Fotomill.tdb");
   const auto outcome = [&] {
-    DatabaseCompaction compaction(path, false);
+    DatabaseCompaction compaction(path, false, true);
     while (!compaction.Ended()) std::this_thread::yield();
     return std::pair(compaction.Succeeded(), compaction.Outcome());
   };

@@ -242,7 +242,7 @@ TEST(Thumbnail, StandInsComeFromTheExif) {
   EXPECT_EQ(LoadThumbnail(wish)->pixels.height, 176);
   wish = {plain, 1, 1, 96, choice::kDiskBased, true};
   EXPECT_EQ(LoadThumbnail(wish), nullptr);
-  ASSERT_EQ(WriteThumbnail(plain), Status::Ok);
+  ASSERT_EQ(WriteThumbnail(plain, {}), Status::Ok);
   wish.side = 48;
   const ThumbnailPointer ready = LoadThumbnail(wish);  // the proper one, smaller than its record
   ASSERT_NE(ready, nullptr);

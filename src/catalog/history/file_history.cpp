@@ -17,9 +17,6 @@
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "platform/reserved_memory.h"
-#include "settings/configuration.h"
-#include "settings/key_table.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -166,13 +163,13 @@ HistoryList list;
 bool outOfMemory = false;  // an entry found no room: the list lacks some
 bool loaded = false;       // the list began with what the file held
 
-void LimitList() {
+void LimitList(const HistoryOptions& options) {
   size_t count = list.Count();
-  if (settings.FileHistoryWindowType == choice::kLimitDays) {
-    const int64_t oldest = platform::Now() - int64_t{settings.FileHistoryWindowDays} * 86400;
+  if (options.limitDays) {
+    const int64_t oldest = platform::Now() - int64_t{options.days} * 86400;
     while (count > 0 && list.At(count - 1).accessed < oldest) --count;
   } else {
-    count = std::min(count, static_cast<size_t>(std::max(settings.FileHistoryWindowCount, 0)));
+    count = std::min(count, static_cast<size_t>(std::max(options.count, 0)));
   }
   list.Cut(count);
 }
@@ -196,7 +193,7 @@ std::string_view TakeLine(std::string_view& text) {
 }
 
 // Records the entries of a history file's text. False when it holds bytes, but no line of a history.
-bool TakeEntries(std::string_view text) {
+bool ReadEntries(const HistoryOptions& options, std::string_view text) {
   bool any = text.empty();
   while (!text.empty()) {
     const std::string_view line = TakeLine(text);
@@ -206,7 +203,7 @@ bool TakeEntries(std::string_view text) {
     const int64_t number = FindField(line, kFunctionTag, function) ? LeadingInteger(function) : kNoFileFunction;
     if (number < 0 || number >= kFileFunctionCount) continue;
     const int32_t time = FindField(line, kAccessedTag, accessed) ? Clamped(LeadingInteger(accessed)) : kOwnTime;
-    (void)RecordFileHistory(path, static_cast<FileFunction>(number), kOwnTime, time);
+    (void)RecordFileHistory(options, path, static_cast<FileFunction>(number), kOwnTime, time);
   }
   return any;
 }
@@ -223,8 +220,8 @@ std::string TextOfList() {
   return text;
 }
 
-bool DeleteHistoryFile() {
-  const std::string path = FileHistoryPath();
+bool DeleteHistoryFile(const HistoryOptions& options) {
+  const std::string path = FileHistoryPath(options);
   return !path.empty() && (!platform::FileExists(path) || platform::DeleteFile(path));
 }
 
@@ -238,11 +235,11 @@ HistoryUpdate UpdateOf(EditResult result) {
   return HistoryUpdate::Failed;
 }
 
-size_t TakeUses(std::span<const FileUse> uses) {
+size_t RecordUses(const HistoryOptions& options, std::span<const FileUse> uses) {
   size_t recorded = 0;
   for (const FileUse& use : uses) {
-    recorded +=
-        use.removed ? RemoveFromFileHistory(use.path) : RecordFileHistory(use.path, use.function, use.created, use.accessed);
+    recorded += use.removed ? RemoveFromFileHistory(use.path)
+                            : RecordFileHistory(options, use.path, use.function, use.created, use.accessed);
   }
   return recorded;
 }
@@ -263,10 +260,11 @@ bool FitsFileHistory(std::string_view path) {
          path.find_first_of(std::string_view("\t\n\r\0", 4)) == std::string_view::npos;
 }
 
-bool RecordFileHistory(std::string_view path, FileFunction function, int32_t created, int32_t accessed) {
+bool RecordFileHistory(const HistoryOptions& options, std::string_view path, FileFunction function, int32_t created,
+                       int32_t accessed) {
   const auto number = static_cast<int32_t>(function);
-  if (settings.FileHistoryEnable == 0 || number < 0 || number >= kFileFunctionCount) return false;
-  if ((settings.FileHistoryFunctions >> number & 1) == 0 || !FitsFileHistory(path)) return false;
+  if (!options.on || number < 0 || number >= kFileFunctionCount) return false;
+  if ((options.functions >> number & 1) == 0 || !FitsFileHistory(path)) return false;
   const platform::FileFacts facts = platform::FactsOf(std::string(path));
   if (facts.kind != platform::FileKind::Regular) return false;
   if (created == kOwnTime) created = Clamped(facts.created);
@@ -275,29 +273,29 @@ bool RecordFileHistory(std::string_view path, FileFunction function, int32_t cre
     outOfMemory = true;
     return false;
   }
-  LimitList();
+  LimitList(options);
   return true;
 }
 
 bool RemoveFromFileHistory(std::string_view path) { return list.Remove(path); }
 
-bool LoadFileHistory() {
-  if (settings.FileHistoryEnable == 0) return false;
-  const std::string path = FileHistoryPath();
+bool LoadFileHistory(const HistoryOptions& options) {
+  if (!options.on) return false;
+  const std::string path = FileHistoryPath(options);
   std::string text;
   if (path.empty()) return false;
   const platform::ReadResult result = platform::ReadWholeFile(path, limits.listFileBytes, text);
   loaded = result == platform::ReadResult::Missing || result == platform::ReadResult::Done;
-  return result == platform::ReadResult::Done && TakeEntries(text);
+  return result == platform::ReadResult::Done && ReadEntries(options, text);
 }
 
-bool SaveFileHistory() {
+bool SaveFileHistory(const HistoryOptions& options) {
   bool saved = false;
-  if (settings.FileHistoryEnable == 0 || (!list.Exists() && loaded)) {
-    saved = DeleteHistoryFile();
-  } else if (list.Exists() && !FileHistoryPath().empty()) {
+  if (!options.on || (!list.Exists() && loaded)) {
+    saved = DeleteHistoryFile(options);
+  } else if (list.Exists() && !FileHistoryPath(options).empty()) {
     const EditResult result =
-        EditTextFile(FileHistoryPath(), limits.listFileBytes, [](std::string& text) { text = TextOfList(); });
+        EditTextFile(FileHistoryPath(options), limits.listFileBytes, [](std::string& text) { text = TextOfList(); });
     saved = UpdateOf(result) == HistoryUpdate::Done;
   }
   ClearFileHistory();
@@ -310,9 +308,9 @@ bool ClearFileHistory() {
   return true;
 }
 
-std::string FileHistoryPath() {
-  if (settings.FileHistoryDatabase.empty() || !IsPlainName(settings.FileHistoryDatabase)) return {};
-  return DataFile(std::string(settings.FileHistoryDatabase).append(kExtension));
+std::string FileHistoryPath(const HistoryOptions& options) {
+  if (options.name.empty() || !IsPlainName(options.name)) return {};
+  return DataFile(options.name + std::string(kExtension));
 }
 
 size_t FileHistoryCount() { return list.Count(); }
@@ -324,19 +322,18 @@ FileHistoryEntry FileHistoryAt(size_t index) {
 
 const ThumbnailRecord* FileHistoryThumbnail(size_t index) { return list.Thumbnail(index); }
 
-HistoryUpdate UpdateFileHistory(std::span<const FileUse> uses, size_t* recorded) {
+HistoryUpdate UpdateFileHistory(const HistoryOptions& options, std::span<const FileUse> uses, size_t* recorded) {
   if (recorded != nullptr) *recorded = 0;
   ClearFileHistory();
-  if (settings.FileHistoryEnable == 0) {
-    const bool forGood = !IsForThisRun(KeyOf(KeyNumber::FileHistoryEnable));
-    return forGood && !DeleteHistoryFile() ? HistoryUpdate::Failed : HistoryUpdate::Off;
+  if (!options.on) {
+    return options.offForGood && !DeleteHistoryFile(options) ? HistoryUpdate::Failed : HistoryUpdate::Off;
   }
-  const std::string path = FileHistoryPath();
+  const std::string path = FileHistoryPath(options);
   if (path.empty()) return HistoryUpdate::Failed;
   bool foreign = false;
   const EditResult result = EditTextFile(path, limits.listFileBytes, [&](std::string& text) {
-    foreign = !TakeEntries(text);
-    const size_t count = foreign ? 0 : TakeUses(uses);
+    foreign = !ReadEntries(options, text);
+    const size_t count = foreign ? 0 : RecordUses(options, uses);
     if (recorded != nullptr) *recorded = count;
     if (!foreign && !outOfMemory && count > 0) text = TextOfList();
   });

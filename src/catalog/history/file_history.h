@@ -43,6 +43,16 @@ enum class FileFunction : int32_t {
 inline constexpr int32_t kFileFunctionCount = 20;
 inline constexpr int32_t kNoFileFunction = -1;
 
+// What the history is to hold: the FileHistory... keys.
+struct HistoryOptions {
+  bool on = true;
+  bool offForGood = true;        // where it is off, it is so in later runs as well
+  uint32_t functions = 0x2FFF3;  // a bit for each function whose files are recorded
+  bool limitDays = false;        // by days, else by count
+  int32_t days = 30, count = 20;
+  std::string name = "FMWFileHistoryDatabase";  // of the file, without extension
+};
+
 // Its name as lists show it; empty for a number that is none.
 std::string_view FileFunctionName(int32_t function);
 // The function of a name, whatever its case; kNoFileFunction when there is none.
@@ -55,22 +65,23 @@ inline constexpr int32_t kOwnTime = -1;
 bool FitsFileHistory(std::string_view path);
 
 // Adds an entry, or gives the entry of that path another function and access time, puts the list in order and limits it
-// as the settings say. False when nothing was recorded: the history or that function is switched off, the path is no
+// as the options say. False when nothing was recorded: the history or that function is switched off, the path is no
 // regular file or does not fit, or there is no memory.
-bool RecordFileHistory(std::string_view path, FileFunction function, int32_t created = kOwnTime, int32_t accessed = kOwnTime);
+bool RecordFileHistory(const HistoryOptions& options, std::string_view path, FileFunction function, int32_t created = kOwnTime,
+                       int32_t accessed = kOwnTime);
 // Takes the entry of a path out of the list. False when there is none.
 bool RemoveFromFileHistory(std::string_view path);
 
 // Reads the history file into the list. False when the history is switched off or the file cannot be read.
-bool LoadFileHistory();
+bool LoadFileHistory(const HistoryOptions& options);
 // Writes the list to the history file, as it is, and frees it. Switched off, the history file is deleted; without a list
 // as well, provided that LoadFileHistory was called before. False when the file cannot be written or was never read.
-bool SaveFileHistory();
+bool SaveFileHistory(const HistoryOptions& options);
 // Frees the list.
 bool ClearFileHistory();
 
-// Path of the history file; empty without a data folder, or when FileHistoryDatabase is no plain name.
-std::string FileHistoryPath();
+// Path of the history file; empty without a data folder, or when its name is no plain one.
+std::string FileHistoryPath(const HistoryOptions& options);
 
 // One entry as lists show it. The path is a view into the list, valid until it changes.
 struct FileHistoryEntry {
@@ -103,8 +114,8 @@ enum class HistoryUpdate {
   Failed,   // it could not be written, or there is no place for it: it is as it was
 };
 // Records uses, in order, for good: locks the history file, reads it afresh, so that what other processes recorded stays,
-// records, and replaces the file in one step. `recorded` counts the uses that were. With the history switched off in the
-// configuration file the history file is deleted; switched off for this run only, it stays. The list is free afterwards.
-HistoryUpdate UpdateFileHistory(std::span<const FileUse> uses, size_t* recorded = nullptr);
+// records, and replaces the file in one step. `recorded` counts the uses that were. With the history switched off for good the
+// history file is deleted; switched off for this run only, it stays. The list is free afterwards.
+HistoryUpdate UpdateFileHistory(const HistoryOptions& options, std::span<const FileUse> uses, size_t* recorded = nullptr);
 
 }  // namespace fotomill

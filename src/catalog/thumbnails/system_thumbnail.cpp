@@ -93,9 +93,9 @@ PicturePointer ReadSystemPicture(const std::string& picturePath, int32_t side) {
   return nullptr;
 }
 
-bool ReadSystemThumbnail(const std::string& picturePath, LargeThumbnailRecord& record) {
+bool ReadSystemThumbnail(const std::string& picturePath, Color matte, LargeThumbnailRecord& record) {
   const PicturePointer picture = ReadCached(picturePath, kCacheFolders[0]);
-  return picture != nullptr && MakeLargeThumbnailRecord(record, *picture);
+  return picture != nullptr && MakeLargeThumbnailRecord(record, *picture, matte);
 }
 
 }  // namespace fotomill

@@ -21,6 +21,6 @@ PicturePointer ReadSystemPicture(const std::string& picturePath, int32_t side);
 
 // Fills a large record with the system's thumbnail of a picture. False when there is none that is valid; `record` is
 // then as before.
-bool ReadSystemThumbnail(const std::string& picturePath, LargeThumbnailRecord& record);
+bool ReadSystemThumbnail(const std::string& picturePath, Color matte, LargeThumbnailRecord& record);
 
 }  // namespace fotomill

@@ -13,7 +13,6 @@
 #include "platform/paths.h"
 #include "platform/process.h"
 #include "platform/volumes.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -124,13 +123,13 @@ bool IsLeftover(const std::string& path) {
          std::ranges::equal(magic, kDatabaseMagic, {}, {}, [](char c) { return static_cast<uint8_t>(c); });
 }
 
-bool MakeEmptyDatabase(const std::string& path, bool& taken) {
+bool MakeEmptyDatabase(const std::string& path, bool hidden, bool& taken) {
   const auto now = static_cast<uint32_t>(platform::Now());
   platform::OutputFile file;
   if (!file.Create(path) || !file.Write(BytesOf(DatabaseHeader{kDatabaseVersion, 0, now, now}))) return false;
   const platform::CommitResult result = file.Commit(platform::Existing::Refuse, true);
   taken = result == platform::CommitResult::Taken;
-  if (result == platform::CommitResult::Done && settings.WriteHiddenThumbnails != 0) (void)platform::SetHidden(path, true);
+  if (result == platform::CommitResult::Done && hidden) (void)platform::SetHidden(path, true);
   return taken || result == platform::CommitResult::Done;
 }
 
@@ -163,15 +162,16 @@ std::string ThumbnailDatabasePath(const std::string& folder) {
   return folder.empty() ? DataFile(kDatabaseName) : platform::JoinFolder(folder, kDatabaseName);
 }
 
-ThumbnailDatabase::Opened ThumbnailDatabase::OpenThumbnailDatabase(const std::string& path, bool create) {
+ThumbnailDatabase::Opened ThumbnailDatabase::OpenThumbnailDatabase(const std::string& path, bool create, bool hidden) {
   using platform::StoreFile;
   CloseThumbnailDatabase();
   path_ = path;
+  hidden_ = hidden;
   StoreFile::OpenResult result = file_.Open(path, StoreFile::Mode::ReadWrite);
   if (result == StoreFile::OpenResult::Missing) {
     bool taken = false;
     if (!create) return Opened::Missing;
-    if (!MakeEmptyDatabase(path, taken)) return Opened::Failed;
+    if (!MakeEmptyDatabase(path, hidden, taken)) return Opened::Failed;
     result = file_.Open(path, StoreFile::Mode::ReadWrite);
   }
   DatabaseHeader header;
@@ -185,7 +185,7 @@ void ThumbnailDatabase::CloseThumbnailDatabase() {
   const bool worthSaving = file_.IsOpen() && indexed_.count >= kLargeIndex && indexed_ != saved_;
   if (worthSaving && indexed_.size == file_.Size() && indexed_.modified == file_.Modified() && file_.IsStill(path_)) {
     index_.Save(IndexPath(path_), indexed_);
-    if (settings.WriteHiddenThumbnails != 0) (void)platform::SetHidden(IndexPath(path_), true);
+    if (hidden_) (void)platform::SetHidden(IndexPath(path_), true);
   }
   file_.Close();
   index_.Clear();
@@ -228,7 +228,7 @@ bool ThumbnailDatabase::LockAndCheck(DatabaseHeader& header) {
       return false;
     }
     file_.Unlock();
-    if (OpenThumbnailDatabase(path_, false) != Opened::Done) return false;
+    if (OpenThumbnailDatabase(path_, false, hidden_) != Opened::Done) return false;
   }
   return false;
 }
@@ -352,7 +352,7 @@ bool ThumbnailDatabase::Find(const std::string& path, const std::string& volume,
   ThumbnailIndex::State state;
   DatabaseHeader header;
   if (!file_.IsStill(path_, state.size, state.modified)) {  // it was compacted meanwhile
-    if (OpenThumbnailDatabase(path_, false) != Opened::Done || !file_.IsStill(path_, state.size, state.modified)) return false;
+    if (OpenThumbnailDatabase(path_, false, hidden_) != Opened::Done || !file_.IsStill(path_, state.size, state.modified)) return false;
   }
   if (!ReadDatabaseHeader(header)) return false;
   state.count = RecordsIn(header, state.size);
@@ -425,7 +425,7 @@ ThumbnailDatabase::Compacted ThumbnailDatabase::CopyLiveRecords(platform::StoreF
 ThumbnailDatabase::Compacted ThumbnailDatabase::CompactThumbnailDatabase(bool purge, ProgressSink* progress,
                                                                          const std::atomic<bool>* stop) {
   const Compacted result = CompactLocked(purge, progress, stop);
-  if (result == Compacted::Done && OpenThumbnailDatabase(path_, false) != Opened::Done) return Compacted::NotRead;
+  if (result == Compacted::Done && OpenThumbnailDatabase(path_, false, hidden_) != Opened::Done) return Compacted::NotRead;
   return result;
 }
 
@@ -447,7 +447,7 @@ ThumbnailDatabase::Compacted ThumbnailDatabase::CompactLocked(bool purge, Progre
   to.Close();
   if (result != Compacted::Done) {
     (void)platform::DeleteFile(copy);
-  } else if (settings.WriteHiddenThumbnails != 0) {
+  } else if (hidden_) {
     (void)platform::SetHidden(path_, true);
   }
   return result;

@@ -92,9 +92,9 @@ class ThumbnailDatabase {
     NotRead,  // it cannot be opened, or is none: it was left alone
     Failed,   // it could not be made
   };
-  // Opens the database of that path; with `create`, one that is missing is made with an empty header, and hidden with
-  // WriteHiddenThumbnails.
-  Opened OpenThumbnailDatabase(const std::string& path, bool create);
+  // Opens the database of that path; with `create`, one that is missing is made with an empty header. With `hidden`
+  // what is made, now or later, is hidden.
+  Opened OpenThumbnailDatabase(const std::string& path, bool create, bool hidden = true);
   void CloseThumbnailDatabase();
 
   // False when the file is shorter than a header or not a database.
@@ -148,6 +148,7 @@ class ThumbnailDatabase {
                             const std::atomic<bool>* stop);
 
   std::string path_;
+  bool hidden_ = false;
   platform::StoreFile file_;
   ThumbnailIndex index_;
   ThumbnailIndex::State indexed_;  // the file as the index knows it: in another state, someone else has changed it

@@ -4,7 +4,6 @@
 #include <cstring>
 
 #include "processing/geometry/scale.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -59,19 +58,19 @@ Status Stretch(const PackedImage& bitmap, int32_t side, PackedImage& stretched) 
   return Status::Ok;
 }
 
-Status Resample(const PackedImage& bitmap, int32_t side, PackedImage& scaled) {
+Status Resample(const PackedImage& bitmap, int32_t side, int32_t filter, PackedImage& scaled) {
   PackedImage noAlpha;
-  return ScaleFiltered(bitmap, {}, {side, side}, ScaleFilterFromKey(settings.ThumbnailZoomFilter), scaled, noAlpha);
+  return ScaleFiltered(bitmap, {}, {side, side}, ScaleFilterFromKey(filter), scaled, noAlpha);
 }
 
-Status MakeDrawnBitmap(const AnyThumbnailRecord& record, uint32_t flags, PackedImage& bitmap) {
+Status MakeDrawnBitmap(const AnyThumbnailRecord& record, uint32_t flags, const ThumbnailOptions& options, PackedImage& bitmap) {
   RETURN_IF_BAD(std::visit([&](const auto& held) { return ThumbnailRecordToBitmap(held, bitmap); }, record));
   if ((flags & kDrawGray) != 0) TurnGray(bitmap);
   const int32_t side = DrawnThumbnailSide(record, flags);
   if (side == bitmap.Width()) return Status::Ok;
-  const bool filtered = (flags & kDrawLargeView) != 0 && settings.FastZoomedThumbnails == 0;
+  const bool filtered = (flags & kDrawLargeView) != 0 && !options.fastZoom;
   PackedImage made;
-  RETURN_IF_BAD(filtered ? Resample(bitmap, side, made) : Stretch(bitmap, side, made));
+  RETURN_IF_BAD(filtered ? Resample(bitmap, side, options.zoomFilter, made) : Stretch(bitmap, side, made));
   bitmap = std::move(made);
   return Status::Ok;
 }
@@ -94,9 +93,10 @@ int32_t DrawnThumbnailSide(const AnyThumbnailRecord& record, uint32_t flags) {
   return std::holds_alternative<LargeThumbnailRecord>(record) ? kLargeThumbnailSide : kSmallThumbnailSide;
 }
 
-bool DrawThumbnailRecord(PackedImage& bitmap, const AnyThumbnailRecord& record, int32_t x, int32_t y, uint32_t flags) {
+bool DrawThumbnailRecord(PackedImage& bitmap, const AnyThumbnailRecord& record, int32_t x, int32_t y, uint32_t flags,
+                         const ThumbnailOptions& options) {
   PackedImage drawn;
-  if (bitmap.Bits() != 24 || MakeDrawnBitmap(record, flags, drawn) != Status::Ok) return false;
+  if (bitmap.Bits() != 24 || MakeDrawnBitmap(record, flags, options, drawn) != Status::Ok) return false;
   CopyClipped(drawn, bitmap, x, y);
   return true;
 }

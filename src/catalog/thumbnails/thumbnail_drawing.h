@@ -22,15 +22,16 @@ inline constexpr uint32_t kDrawGray = 8;
 int32_t DrawnThumbnailSide(const AnyThumbnailRecord& record, uint32_t flags);
 
 // Draws a record into a 24-bit bitmap, the square's top left corner at column x, row y from the top; what lies outside
-// the bitmap is left out. A small record is enlarged for the large view with the filter of ThumbnailZoomFilter, or with
-// FastZoomedThumbnails by spreading its pixels. False without memory, or when the bitmap has another depth; it is then
+// the bitmap is left out. A small record is enlarged for the large view with the filter of the options, or by
+// spreading its pixels. False without memory, or when the bitmap has another depth; it is then
 // as before.
-bool DrawThumbnailRecord(PackedImage& bitmap, const AnyThumbnailRecord& record, int32_t x, int32_t y, uint32_t flags);
+bool DrawThumbnailRecord(PackedImage& bitmap, const AnyThumbnailRecord& record, int32_t x, int32_t y, uint32_t flags,
+                         const ThumbnailOptions& options);
 
 // Fills a record with one of the two pictures that stand for a thumbnail that is not there: 9501, one can still be
 // made; 9502, none can. False for another number.
 inline constexpr int32_t kPlaceholderNotMade = 9501;
 inline constexpr int32_t kPlaceholderUnreadable = 9502;
-bool MakePlaceholderRecord(ThumbnailRecord& record, int32_t which);
+bool MakePlaceholderRecord(ThumbnailRecord& record, int32_t which, Color matte);
 
 }  // namespace fotomill

@@ -10,7 +10,6 @@
 #include "platform/output_file.h"
 #include "platform/paths.h"
 #include "registry/registry.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -56,12 +55,12 @@ bool ReadThumbnailForPicture(const std::string& picturePath, ThumbnailRecord& re
   return true;
 }
 
-bool WriteThumbnailFile(ThumbnailRecord& record, const std::string& path) {
+bool WriteThumbnailFile(ThumbnailRecord& record, const std::string& path, bool hidden) {
   record.Sign();
   const platform::FileFacts facts = platform::FactsOf(path);
   if (facts.kind == platform::FileKind::Regular && !facts.link && !platform::SetNormal(path)) return false;
   if (!WriteRecord(record, path)) return false;
-  if (settings.WriteHiddenThumbnails != 0) (void)platform::SetHidden(path, true);  // seen or not, it is there
+  if (hidden) (void)platform::SetHidden(path, true);  // seen or not, it is there
   return true;
 }
 
@@ -70,14 +69,14 @@ bool WriteThumbnailForPicture(const std::string& picturePath, const PictureRecor
   return MakeBlendedThumbnailRecord(record, picture, background) && WriteRecord(record, ThumbnailPathFor(picturePath));
 }
 
-Status MakeThumbnailOfFile(const std::string& picturePath, ThumbnailRecord& record) {
+Status MakeThumbnailOfFile(const std::string& picturePath, const ThumbnailOptions& options, ThumbnailRecord& record) {
   PicturePointer picture;
   RETURN_IF_BAD(LoadPictureInfo(picturePath.c_str(), picture));
   // The quick scaler's result depends on the size that it starts from.
-  if (settings.ThumbnailQuickResize == 0) picture->thumbnailSide = kSmallThumbnailSide;
+  if (!options.quick) picture->thumbnailSide = kSmallThumbnailSide;
   RETURN_IF_BAD(ReadPicture(*picture));
   if (picture->image.Empty()) return Status::EmptyImage;
-  return MakeThumbnailRecord(record, *picture) ? Status::Ok : Status::MemoryAllocationError;
+  return MakeThumbnailRecord(record, *picture, options) ? Status::Ok : Status::MemoryAllocationError;
 }
 
 std::optional<std::vector<std::string>> OrphanThumbnails(const std::string& folder, const std::vector<std::string>& names) {

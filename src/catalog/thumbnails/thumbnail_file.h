@@ -26,14 +26,14 @@ bool ReadThumbnailFile(ThumbnailRecord& record, const std::string& path);
 bool ReadThumbnailForPicture(const std::string& picturePath, ThumbnailRecord& record);
 
 // Signs a record and writes it, in one step, in place of what file or link has the name, even a hidden or protected one;
-// hides the file with WriteHiddenThumbnails. False when it cannot be written; what was there stays.
-bool WriteThumbnailFile(ThumbnailRecord& record, const std::string& path);
+// hides the file with `hidden`. False when it cannot be written; what was there stays.
+bool WriteThumbnailFile(ThumbnailRecord& record, const std::string& path, bool hidden);
 // Makes a record by MakeBlendedThumbnailRecord and writes the thumbnail file of a picture; attributes stay as they are.
 bool WriteThumbnailForPicture(const std::string& picturePath, const PictureRecord& picture, Color background);
 
 // Reads a picture, as small as it serves, and makes its record. Statuses of reading, EmptyImage when the format has no
 // pixels, or MemoryAllocationError; `record` is then as before.
-Status MakeThumbnailOfFile(const std::string& picturePath, ThumbnailRecord& record);
+Status MakeThumbnailOfFile(const std::string& picturePath, const ThumbnailOptions& options, ThumbnailRecord& record);
 
 // The thumbnail files of a folder to which none of the names in it belongs, the case of letters ignored: regular files,
 // not links, names that begin with "." left out; in byte order. nullopt when the folder cannot be read.

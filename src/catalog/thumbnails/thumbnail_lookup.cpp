@@ -4,15 +4,14 @@
 #include "catalog/thumbnails/thumbnail_database.h"
 #include "catalog/thumbnails/thumbnail_file.h"
 #include "platform/paths.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
 namespace {
 
-bool ReadFromSystem(const std::string& picturePath, AnyThumbnailRecord& record) {
+bool ReadFromSystem(const std::string& picturePath, Color matte, AnyThumbnailRecord& record) {
   LargeThumbnailRecord large;
-  if (!ReadSystemThumbnail(picturePath, large)) return false;
+  if (!ReadSystemThumbnail(picturePath, matte, large)) return false;
   record = large;
   return true;
 }
@@ -24,7 +23,7 @@ bool ReadListed(const std::string& picturePath, const ThumbnailSources& sources,
 }
 
 bool ReadSmall(const std::string& picturePath, const ThumbnailSources& sources, ThumbnailRecord& record) {
-  const bool usesFile = sources.mode == choice::kDiskBased || settings.AlwaysUseTHN != 0;
+  const bool usesFile = sources.mode == choice::kDiskBased || sources.options.fromFiles;
   if (usesFile && ReadThumbnailFile(record, ThumbnailPathFor(picturePath))) return true;
   switch (sources.mode) {
     case choice::kDiskBased: return false;
@@ -39,8 +38,8 @@ bool ReadSmall(const std::string& picturePath, const ThumbnailSources& sources, 
 
 bool LookUpThumbnail(const std::string& picturePath, bool large, const ThumbnailSources& sources, AnyThumbnailRecord& record) {
   const bool fromSystem =
-      large && sources.mode == choice::kDiskBased && sources.systemCache && settings.UseWindowsThumbnailCache != 0;
-  if (fromSystem && ReadFromSystem(picturePath, record)) return true;
+      large && sources.mode == choice::kDiskBased && sources.systemCache && sources.options.fromSystem;
+  if (fromSystem && ReadFromSystem(picturePath, sources.options.matte, record)) return true;
   ThumbnailRecord small;
   if (!ReadSmall(picturePath, sources, small)) return false;
   record = small;

@@ -18,6 +18,7 @@ struct ThumbnailSources {
   // Virtual mode: the record that the browser's list holds for a file name; null when it has none.
   std::function<const ThumbnailRecord*(std::string_view name)> listed;
   ThumbnailDatabase* database = nullptr;  // of the two database modes, open; null when it could not be opened
+  ThumbnailOptions options = {};
 };
 
 // Fills a record with the thumbnail of a picture as the mode says: thumbnail file, list, database or, for a large view

@@ -4,7 +4,6 @@
 #include <span>
 
 #include "catalog/thumbnails/thumbnail_drawing.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -74,11 +73,11 @@ void Paint(ThumbnailRecord& record, const Shape& shape) {
 
 }  // namespace
 
-bool MakePlaceholderRecord(ThumbnailRecord& record, int32_t which) {
+bool MakePlaceholderRecord(ThumbnailRecord& record, int32_t which, Color matte) {
   if (which != kPlaceholderNotMade && which != kPlaceholderUnreadable) return false;
   record = ThumbnailRecord();
   record.Sign();
-  record.Fill(static_cast<Color>(settings.ThumbnailMatte));
+  record.Fill(matte);
   const std::span<const Shape> shapes = which == kPlaceholderNotMade ? std::span<const Shape>(kPhotograph) : kCrossedSheet;
   for (const Shape& shape : shapes) Paint(record, shape);
   return true;

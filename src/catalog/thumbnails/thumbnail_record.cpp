@@ -6,7 +6,6 @@
 #include "processing/color/blend.h"
 #include "processing/geometry/scale.h"
 #include "processing/promote.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -112,11 +111,11 @@ void ExpandOldRecord(ThumbnailRecord& record) {
   }
 }
 
-bool MakeThumbnailRecord(ThumbnailRecord& record, const PictureRecord& picture) {
+bool MakeThumbnailRecord(ThumbnailRecord& record, const PictureRecord& picture, const ThumbnailOptions& options) {
   ScaledPicture scaled;
   if (picture.image.Empty()) return false;
-  const Status status = settings.ThumbnailQuickResize != 0 ? ScaleQuickly(picture, scaled) : ScaleToFit(picture, scaled);
-  return status == Status::Ok && PlaceInSquare(scaled, static_cast<Color>(settings.ThumbnailMatte), Blend, record) == Status::Ok;
+  const Status status = options.quick ? ScaleQuickly(picture, scaled) : ScaleToFit(picture, scaled);
+  return status == Status::Ok && PlaceInSquare(scaled, options.matte, Blend, record) == Status::Ok;
 }
 
 bool MakeBlendedThumbnailRecord(ThumbnailRecord& record, const PictureRecord& picture, Color background) {
@@ -125,13 +124,13 @@ bool MakeBlendedThumbnailRecord(ThumbnailRecord& record, const PictureRecord& pi
          PlaceInSquare(scaled, background, MixEachRoundedDown, record) == Status::Ok;
 }
 
-bool MakeLargeThumbnailRecord(LargeThumbnailRecord& record, const PictureRecord& picture) {
+bool MakeLargeThumbnailRecord(LargeThumbnailRecord& record, const PictureRecord& picture, Color matte) {
   if (picture.image.Empty()) return false;
   Size size{picture.image.Width(), picture.image.Height()};
   if (std::max(size.width, size.height) > kLargeThumbnailSide) size = FitSize(size.width, size.height, kLargeThumbnailSide);
   ScaledPicture scaled;
   return ScaleFiltered(picture.image, picture.alpha, size, ScaleFilter::Lanczos, scaled.image, scaled.alpha) == Status::Ok &&
-         PlaceInSquare(scaled, static_cast<Color>(settings.ThumbnailMatte), Blend, record) == Status::Ok;
+         PlaceInSquare(scaled, matte, Blend, record) == Status::Ok;
 }
 
 Status ThumbnailRecordToBitmap(const ThumbnailRecord& record, PackedImage& bitmap) { return ToBitmap(record, bitmap); }

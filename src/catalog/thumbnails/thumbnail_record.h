@@ -6,6 +6,7 @@
 #include <span>
 #include <string_view>
 
+#include "catalog/thumbnails/thumbnail_options.h"
 #include "picture/packed_image.h"
 #include "picture/palette.h"
 #include "picture/picture_record.h"
@@ -76,14 +77,14 @@ const Palette& ThumbnailPalette();
 void ExpandOldRecord(ThumbnailRecord& record);
 
 // Makes a record from a picture that was read: scaled to fit by the filtered scaler, or by the quick one with
-// ThumbnailQuickResize, alpha flattened onto ThumbnailMatte. An image that is smaller than the picture's `width` and
+// `quick`, alpha flattened onto the matte. An image that is smaller than the picture's `width` and
 // `height` (a reduced decode) will do for the filtered scaler. False without pixels or memory; `record` is then as before.
-bool MakeThumbnailRecord(ThumbnailRecord& record, const PictureRecord& picture);
+bool MakeThumbnailRecord(ThumbnailRecord& record, const PictureRecord& picture, const ThumbnailOptions& options);
 // The same by the quick scaler only, alpha blended with `background`, each product rounded down by itself.
 bool MakeBlendedThumbnailRecord(ThumbnailRecord& record, const PictureRecord& picture, Color background);
 // A large record: a picture that does not fit is scaled down by the filtered scaler, a smaller one stays as large as it is;
-// alpha is flattened onto ThumbnailMatte.
-bool MakeLargeThumbnailRecord(LargeThumbnailRecord& record, const PictureRecord& picture);
+// alpha is flattened onto the matte.
+bool MakeLargeThumbnailRecord(LargeThumbnailRecord& record, const PictureRecord& picture, Color matte);
 
 // A new 24-bit bitmap with the record's pixels. Statuses as NewPackedImage.
 Status ThumbnailRecordToBitmap(const ThumbnailRecord& record, PackedImage& bitmap);

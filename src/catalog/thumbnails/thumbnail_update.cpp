@@ -8,7 +8,6 @@
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "platform/volumes.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -40,7 +39,7 @@ bool MakeRecordsInMemory(const ThumbnailBrowser& browser, ThumbnailUpdateFace& f
     if (file.starts_with('.') || HasThumbnailFile(path)) continue;
     if (!face.ShowProgress("Creating thumbnails", i, browser.files.size())) return false;
     ThumbnailRecord record;
-    if (MakeThumbnailOfFile(path, record) == Status::Ok) face.AttachRecord(file, record);
+    if (MakeThumbnailOfFile(path, browser.options.making, record) == Status::Ok) face.AttachRecord(file, record);
   }
   return true;
 }
@@ -55,22 +54,26 @@ bool FindMissing(const ThumbnailBrowser& browser, ThumbnailUpdateFace& face, std
   return true;
 }
 
-int32_t SelectedChoice() {
-  const int32_t stored = settings.UpdateThumbnailsOptions;
+int32_t SelectedChoice(int32_t stored) {
   return stored >= kUpdateCreate && stored <= kUpdateNever ? stored : kUpdateCreate;
 }
 
-void TakeChoice(int32_t choice, const std::vector<std::string>& missing, ThumbnailBrowser& browser, ThumbnailUpdateFace& face) {
+void Keep(int32_t choice, ThumbnailBrowser& browser, ThumbnailUpdateFace& face) {
+  browser.options.choice = choice;
+  face.KeepChoice(browser.options);
+}
+
+void ApplyChoice(int32_t choice, const std::vector<std::string>& missing, ThumbnailBrowser& browser, ThumbnailUpdateFace& face) {
   switch (choice) {
     case kUpdateCreate:
-      settings.UpdateThumbnailsOptions = choice;
+      Keep(choice, browser, face);
       if (face.BuildThumbnails(missing) > 0) face.Refresh();
       break;
-    case kUpdateLater: settings.UpdateThumbnailsOptions = choice; break;
+    case kUpdateLater: Keep(choice, browser, face); break;
     case kUpdateNotHere: browser.asks = false; break;  // what is stored stays, as this was said of one browser only
     case kUpdateNever:
-      settings.UpdateThumbnailsOptions = choice;
-      settings.UpdateThumbnailsFlag = 0;
+      browser.options.offers = false;
+      Keep(choice, browser, face);
       break;
     default: break;
   }
@@ -90,20 +93,20 @@ bool OfferThumbnailUpdate(ThumbnailBrowser& browser, ThumbnailUpdateFace& face) 
   if (IsCompactionDue(browser)) (void)RemoveOrphanThumbnails(browser);
 
   const bool showsThumbnails = browser.view >= choice::kViewSmall && browser.view <= choice::kViewLarge;
-  if (settings.UpdateThumbnailsFlag == 0 || !showsThumbnails || !browser.asks || browser.files.empty()) return false;
+  if (!browser.options.offers || !showsThumbnails || !browser.asks || browser.files.empty()) return false;
   std::vector<std::string> missing;
   if (!FindMissing(browser, face, missing) || missing.empty()) return false;
-  TakeChoice(face.AskForUpdate(static_cast<int32_t>(missing.size()), SelectedChoice()), missing, browser, face);
+  ApplyChoice(face.AskForUpdate(static_cast<int32_t>(missing.size()), SelectedChoice(browser.options.choice)), missing, browser, face);
   return true;
 }
 
 bool IsCompactionDue(const ThumbnailBrowser& browser) {
-  const int64_t interval = int64_t{std::max(settings.ThumbnailCompactInterval, 0)} * 86400;
+  const int64_t interval = int64_t{std::max(browser.options.compactionDays, 0)} * 86400;
   return browser.compacts && browser.lastCompaction < platform::Now() - interval;
 }
 
 bool RemoveOrphanThumbnails(ThumbnailBrowser& browser) {
-  if (settings.UseThumbnailCompacting == 0 || !IsOn(browser.folder, kCompactedOn)) return false;
+  if (!browser.options.compacts || !IsOn(browser.folder, kCompactedOn)) return false;
   const auto orphans = OrphanThumbnails(browser.folder, browser.files);
   if (!orphans) return false;
   for (const std::string& orphan : *orphans) (void)platform::DeleteFile(orphan);

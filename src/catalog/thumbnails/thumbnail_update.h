@@ -12,6 +12,15 @@ namespace fotomill {
 // What a browser does about thumbnails once it has listed a folder: makes the records that live in memory only, removes
 // thumbnail files that have lost their picture, and offers to make those that are missing.
 
+// How the user wants that: the keys named.
+struct ThumbnailUpdateOptions {
+  bool offers = true;                     // UpdateThumbnailsFlag
+  int32_t choice = 101;                   // UpdateThumbnailsOptions: what the box begins with
+  bool compacts = false;                  // UseThumbnailCompacting
+  int32_t compactionDays = 30;            // ThumbnailCompactInterval
+  ThumbnailOptions making;                // of records in memory
+};
+
 // What the work needs to know of a browser, and what it keeps in it.
 struct ThumbnailBrowser {
   std::string folder;
@@ -21,6 +30,7 @@ struct ThumbnailBrowser {
   bool asks = true;            // false once its user wants no more offers here
   bool compacts = true;        // removes orphans
   int64_t lastCompaction = 0;  // seconds since 1970 UTC
+  ThumbnailUpdateOptions options = {};
 };
 
 // Values of UpdateThumbnailsOptions and the texts of the box "Update Thumbnails", which shows ThumbnailUpdateQuestion,
@@ -48,16 +58,18 @@ class ThumbnailUpdateFace {
   // Makes the thumbnail files of these files of the list; how many were made.
   virtual int32_t BuildThumbnails(const std::vector<std::string>& files) = 0;
   virtual void Refresh() = 0;
+  // The choice that the options hold is to be kept for later offers.
+  virtual void KeepChoice(const ThumbnailUpdateOptions& options) { (void)options; }
 };
 
 // All of it. Never in the database modes, nor on removable drives. True when an offer was made; what was chosen is then in
-// the browser and in the settings UpdateThumbnailsOptions and UpdateThumbnailsFlag.
+// the browser and its options.
 bool OfferThumbnailUpdate(ThumbnailBrowser& browser, ThumbnailUpdateFace& face);
 
 // Whether so much time has passed since the browser's last compaction that the next one is due.
 bool IsCompactionDue(const ThumbnailBrowser& browser);
-// Deletes thumbnail files to which no file of the browser's list belongs. False, and nothing happens, without
-// UseThumbnailCompacting, on optical drives and drives of a kind unknown, or when the folder cannot be read. The time of a
+// Deletes thumbnail files to which no file of the browser's list belongs. False, and nothing happens, unless
+// the options compact, on optical drives and drives of a kind unknown, or when the folder cannot be read. The time of a
 // successful run is kept in the browser.
 bool RemoveOrphanThumbnails(ThumbnailBrowser& browser);
 

@@ -12,6 +12,7 @@
 #include "platform/clock.h"
 #include "platform/files.h"
 #include "platform/folders.h"
+#include "settings/job_options.h"
 #include "settings/settings.h"
 
 namespace fotomill::cli {
@@ -32,7 +33,7 @@ constexpr std::string_view kNotWritten = "The file history could not be written.
 
 int Complain(const CommandContext& context, std::string_view message) {
   ResultOutput output(context, false);
-  const std::string path = FileHistoryPath();
+  const std::string path = FileHistoryPath(HistoryOptionsFromSettings());
   output.Note((path.empty() ? "fotomill" : output.ShownMessage(path)) + ": " + std::string(message));
   return kExitFailed;
 }
@@ -46,9 +47,9 @@ std::string TimeText(int64_t seconds) {
 }
 
 int RunList(const HistoryOptions& options, const CommandContext& context) {
-  const std::string path = FileHistoryPath();
+  const std::string path = FileHistoryPath(HistoryOptionsFromSettings());
   ResultOutput output(context, options.json);
-  const bool read = LoadFileHistory();
+  const bool read = LoadFileHistory(HistoryOptionsFromSettings());
   for (size_t i = 0; i < FileHistoryCount() && output.GoesOn(); ++i) {
     const FileHistoryEntry entry = FileHistoryAt(i);
     const std::string name(FileFunctionName(entry.function));
@@ -108,7 +109,7 @@ int RunAdd(const HistoryOptions& options, const CommandContext& context) {
     return kExitOk;
   }
   size_t recorded = 0;
-  switch (UpdateFileHistory({&use, 1}, &recorded)) {
+  switch (UpdateFileHistory(HistoryOptionsFromSettings(), {&use, 1}, &recorded)) {
     case HistoryUpdate::Off: output.Note("The file history is switched off."); return kExitOk;
     case HistoryUpdate::NotRead: return Complain(context, kNotRead);
     case HistoryUpdate::Failed: return Complain(context, kNotWritten);
@@ -119,7 +120,7 @@ int RunAdd(const HistoryOptions& options, const CommandContext& context) {
 }
 
 int RunClear(const HistoryOptions& options, const CommandContext& context) {
-  const std::string path = FileHistoryPath();
+  const std::string path = FileHistoryPath(HistoryOptionsFromSettings());
   ClearFileHistory();
   if (path.empty() || !platform::FileExists(path)) return kExitOk;
   if (options.dryRun) {

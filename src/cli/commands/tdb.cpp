@@ -17,6 +17,7 @@
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/process.h"
+#include "settings/job_options.h"
 
 namespace fotomill::cli {
 
@@ -38,7 +39,7 @@ constexpr size_t kAddedAtOnce = 64;  // pictures, about 2 MB
 
 // Opens a database. False after a message.
 bool OpenDatabase(ThumbnailDatabase& database, const std::string& path, bool create, ResultOutput& output) {
-  switch (database.OpenThumbnailDatabase(path, create)) {
+  switch (database.OpenThumbnailDatabase(path, create, ThumbnailOptionsFromSettings().hidden)) {
     case ThumbnailDatabase::Opened::Done: return true;
     case ThumbnailDatabase::Opened::Missing: output.Failure(path, Status::FileOpenError); break;
     case ThumbnailDatabase::Opened::NotRead: output.Failure(path, Status::DamagedFile, kNoDatabase); break;
@@ -54,7 +55,7 @@ struct Adding {
   std::unique_ptr<DatabaseRecord> record;
 };
 
-Adding MakeRecord(const SelectedFile& file) {
+Adding MakeRecord(const SelectedFile& file, const ThumbnailOptions& options) {
   Adding adding{file.status, file.hint, std::make_unique<DatabaseRecord>()};
   if (adding.status != Status::Ok) return adding;
   adding.record->path = platform::AbsolutePath(file.name);
@@ -63,7 +64,7 @@ Adding MakeRecord(const SelectedFile& file) {
     adding.hint = "Its path is longer than 260 characters.";
     return adding;
   }
-  adding.status = MakeThumbnailOfFile(file.name, adding.record->thumbnail);
+  adding.status = MakeThumbnailOfFile(file.name, options, adding.record->thumbnail);
   adding.record->volume = VolumeKeyFor(adding.record->path);
   return adding;
 }
@@ -108,6 +109,7 @@ class Appending {
 };
 
 int AddFiles(const std::vector<SelectedFile>& files, uint32_t jobs, ThumbnailDatabase& database, ResultOutput& output) {
+  const ThumbnailOptions options = ThumbnailOptionsFromSettings();
   Appending appending(database, output);
   std::vector<Adding> addings(files.size());
   std::atomic<bool> goesOn = true;
@@ -115,7 +117,7 @@ int AddFiles(const std::vector<SelectedFile>& files, uint32_t jobs, ThumbnailDat
       .work =
           [&](size_t item) {
             const FolderScope folder(files[item].name);
-            addings[item] = MakeRecord(files[item]);
+            addings[item] = MakeRecord(files[item], options);
             return Status::Ok;
           },
       .deliver =
@@ -172,7 +174,7 @@ int RunFind(const TdbOptions& options, CommandContext& context) {
     output.Failure(options.out, Status::ErrorCreatingFile, "The file is there; --overwrite replace replaces it.");
     return output.Finish();
   }
-  if (!WriteThumbnailFile(record, options.out)) {
+  if (!WriteThumbnailFile(record, options.out, ThumbnailOptionsFromSettings().hidden)) {
     output.Failure(options.out, Status::ErrorCreatingFile);
     return output.Finish();
   }

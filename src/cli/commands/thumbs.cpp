@@ -24,6 +24,7 @@
 #include "platform/volumes.h"
 #include "processing/geometry/scale.h"
 #include "registry/registry.h"
+#include "settings/job_options.h"
 #include "settings/settings.h"
 
 namespace fotomill::cli {
@@ -63,10 +64,10 @@ const char* NameOf(ThumbnailState state) {
   return "broken";
 }
 
-Status MakeThumbnail(const std::string& name) {
+Status MakeThumbnail(const std::string& name, const ThumbnailOptions& options) {
   ThumbnailRecord record;
-  RETURN_IF_BAD(MakeThumbnailOfFile(name, record));
-  return WriteThumbnailFile(record, ThumbnailPathFor(name)) ? Status::Ok : Status::ErrorCreatingFile;
+  RETURN_IF_BAD(MakeThumbnailOfFile(name, options, record));
+  return WriteThumbnailFile(record, ThumbnailPathFor(name), options.hidden) ? Status::Ok : Status::ErrorCreatingFile;
 }
 
 // A file of the selection, and what became of it.
@@ -115,6 +116,7 @@ int RunMake(const ThumbsOptions& options, const CommandContext& context) {
   const auto files = SelectFiles(options.selection, context);
   if (!files) return kExitUsage;
   std::vector<Making> makings = PlanMaking(*files, options.force);
+  const ThumbnailOptions thumbnails = ThumbnailOptionsFromSettings();
   ResultOutput output(context, options.json);
   UsedFiles used(options.dryRun ? std::nullopt : std::optional(FileFunction::Catalog));
   std::atomic<bool> goesOn = true;
@@ -124,7 +126,7 @@ int RunMake(const ThumbsOptions& options, const CommandContext& context) {
             if (options.dryRun) return Status::Ok;
             const FolderScope folder((*files)[item].name);
             for (const size_t i : makings[item].together) {
-              makings[i].status = Guarded([&] { return MakeThumbnail((*files)[i].name); });
+              makings[i].status = Guarded([&] { return MakeThumbnail((*files)[i].name, thumbnails); });
             }
             return Status::Ok;
           },

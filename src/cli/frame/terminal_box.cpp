@@ -1,4 +1,5 @@
 #include "cli/frame/terminal_box.h"
+#include "settings/job_options.h"
 
 namespace fotomill::cli {
 
@@ -30,7 +31,7 @@ void TerminalBox::ShowElement(const FileOutcome& outcome) {
 }
 
 int FinishBatch(const BatchJob& job) {
-  if (!job.uses.empty()) (void)UpdateFileHistory(job.uses);  // a history that cannot be written is no failure
+  if (!job.uses.empty()) (void)UpdateFileHistory(HistoryOptionsFromSettings(), job.uses);  // a history that cannot be written is no failure
   return job.errors || job.writeAborts > 0 ? kExitFailed : kExitOk;
 }
 

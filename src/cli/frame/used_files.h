@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "catalog/history/file_history.h"
+#include "settings/job_options.h"
 
 namespace fotomill::cli {
 
@@ -18,7 +19,7 @@ class UsedFiles {
   UsedFiles(const UsedFiles&) = delete;
   UsedFiles& operator=(const UsedFiles&) = delete;
   ~UsedFiles() {
-    if (!uses_.empty()) (void)UpdateFileHistory(uses_);
+    if (!uses_.empty()) (void)UpdateFileHistory(HistoryOptionsFromSettings(), uses_);
   }
 
   // The command has just dealt with that file.

@@ -7,7 +7,7 @@
 #include "desktop/models/thumbnails/thumbnail.h"
 #include "platform/files.h"
 #include "processing/geometry/scale.h"
-#include "settings/settings.h"
+#include "settings/job_options.h"
 
 namespace fotomill::desktop {
 
@@ -20,7 +20,7 @@ std::string DimensionsText(int32_t width, int32_t height, int32_t bits) {
 }
 
 // A copy of a picture that belongs to somebody else, scaled to a square.
-RgbImage SmallCopy(const PictureRecord& picture, int32_t side) {
+RgbImage SmallCopy(const PictureRecord& picture, int32_t side, Color matte) {
   PackedImage scaled, alpha;
   RgbImage rgb;
   const Size size = FitSize(picture.image.Width(), picture.image.Height(), side);
@@ -31,23 +31,23 @@ RgbImage SmallCopy(const PictureRecord& picture, int32_t side) {
   small.bitsPerPixel = scaled.Bits();
   small.image = std::move(scaled);
   small.alpha = std::move(alpha);
-  if (PrepareForDisplay(small, static_cast<Color>(settings.ThumbnailMatte)) == Status::Ok) (void)ToRgb(small.image, rgb);
+  if (PrepareForDisplay(small, matte) == Status::Ok) (void)ToRgb(small.image, rgb);
   return rgb;
 }
 
 }  // namespace
 
-OverwritePreview MakeOverwritePreview(const OverwriteQuestion& question, int32_t side) {
+OverwritePreview MakeOverwritePreview(const OverwriteQuestion& question, int32_t side, const ThumbnailOptions& options) {
   OverwritePreview preview;
   const platform::FileFacts there = platform::FactsOf(question.path);
-  const ThumbnailPointer existing = LoadThumbnail({question.path, there.modified, there.size, side, choice::kVirtual});
+  const ThumbnailPointer existing = LoadThumbnail({question.path, there.modified, there.size, side, choice::kVirtual, false, options});
   preview.existing = existing->pixels;
   preview.existingText = SizeText(there.size, choice::kSizeFitting) + "\n" + DateText(there.modified);
   if (existing->width > 0)
     preview.existingText.append("\n").append(DimensionsText(existing->width, existing->height, existing->bits));
   if (question.picture == nullptr) return preview;
   const PictureRecord& incoming = *question.picture;
-  if (!incoming.image.Empty()) preview.incoming = SmallCopy(incoming, side);
+  if (!incoming.image.Empty()) preview.incoming = SmallCopy(incoming, side, options.matte);
   const platform::FileFacts source = platform::FactsOf(question.source);
   preview.incomingText.append("From ").append(SizeText(source.size, choice::kSizeFitting)).append("\n");
   preview.incomingText.append(DateText(source.modified)).append("\n");
@@ -88,10 +88,10 @@ class BatchThread::Box : public ProgressBox {
 // The batch's side of the prompts.
 class BatchThread::Questions : public Prompts {
  public:
-  explicit Questions(BatchThread& batch) : batch_(batch) {}
+  Questions(BatchThread& batch, const ThumbnailOptions& thumbnails) : batch_(batch), thumbnails_(thumbnails) {}
   OverwriteAnswer AskOverwrite(const OverwriteQuestion& question) override {
     OverwritePreview preview;
-    if (question.checks.previews) preview = MakeOverwritePreview(question, kPreviewSide);
+    if (question.checks.previews) preview = MakeOverwritePreview(question, kPreviewSide, thumbnails_);
     OverwriteAnswer answer;
     answer.skipRest = !batch_.AskWindow([&] { answer = batch_.windows_.AskOverwrite(question, preview); });
     return answer;
@@ -123,6 +123,7 @@ class BatchThread::Questions : public Prompts {
   }
 
   BatchThread& batch_;
+  const ThumbnailOptions thumbnails_;
 };
 
 BatchThread::~BatchThread() {
@@ -148,9 +149,9 @@ void BatchThread::StartWork(BatchJob job, Work work) {
   // The settings belong to the window's thread.
   job_.remember = [this](Remembered what, int32_t value) { Tell([what, value] { StoreRemembered(what, value); }); };
   running_ = true;
-  thread_ = std::thread([this, work = std::move(work)] {
+  thread_ = std::thread([this, work = std::move(work), thumbnails = ThumbnailOptionsFromSettings()] {
     Box box(*this);
-    Questions questions(*this);
+    Questions questions(*this, thumbnails);
     job_.box = &box;
     job_.prompts = &questions;
     const Status status = work(job_);

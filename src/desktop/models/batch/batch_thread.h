@@ -13,6 +13,7 @@
 #include "batch/progress_box.h"
 #include "batch/prompts.h"
 #include "batch/run.h"
+#include "catalog/thumbnails/thumbnail_options.h"
 #include "desktop/models/drawing/rgb_image.h"
 
 namespace fotomill::desktop {
@@ -83,6 +84,6 @@ class BatchThread {
 };
 
 // What the overwrite prompt shows of the file that is there and of the new picture, which may be missing.
-OverwritePreview MakeOverwritePreview(const OverwriteQuestion& question, int32_t side);
+OverwritePreview MakeOverwritePreview(const OverwriteQuestion& question, int32_t side, const ThumbnailOptions& options);
 
 }  // namespace fotomill::desktop

@@ -11,6 +11,7 @@
 #include "platform/paths.h"
 #include "platform/volumes.h"
 #include "registry/registry.h"
+#include "settings/job_options.h"
 #include "settings/settings.h"
 
 namespace fotomill::desktop {
@@ -58,7 +59,7 @@ std::span<const HistoryColumnFacts> HistoryColumns() { return kColumns; }
 bool FileHistoryList::Take() {
   rows_.clear();
   ClearFileHistory();
-  const bool read = LoadFileHistory();
+  const bool read = LoadFileHistory(HistoryOptionsFromSettings());
   for (size_t i = 0; i < FileHistoryCount(); ++i) {
     const FileHistoryEntry entry = FileHistoryAt(i);
     rows_.push_back({std::string(entry.path), entry.function, entry.created, entry.accessed, entry.size});
@@ -66,7 +67,7 @@ bool FileHistoryList::Take() {
   ClearFileHistory();
   column_ = std::clamp(settings.FileHistorySortMode, 0, static_cast<int32_t>(std::size(kColumns)) - 1);
   Sort();
-  const std::string path = FileHistoryPath();
+  const std::string path = FileHistoryPath(HistoryOptionsFromSettings());
   return read || settings.FileHistoryEnable == 0 || path.empty() || !platform::FileExists(path);
 }
 
@@ -98,14 +99,14 @@ std::string FileHistoryList::Cell(size_t row, size_t column) const {
 bool FileHistoryList::Remove(std::vector<size_t> rows) {
   std::vector<FileUse> uses;
   for (const size_t row : rows) uses.push_back({.path = rows_[row].path, .removed = true});
-  if (UpdateFileHistory(uses) != HistoryUpdate::Done) return false;
+  if (UpdateFileHistory(HistoryOptionsFromSettings(), uses) != HistoryUpdate::Done) return false;
   std::ranges::sort(rows, std::greater<>());
   for (const size_t row : rows) rows_.erase(rows_.begin() + static_cast<std::ptrdiff_t>(row));
   return true;
 }
 
 bool FileHistoryList::Clear() {
-  const std::string path = FileHistoryPath();
+  const std::string path = FileHistoryPath(HistoryOptionsFromSettings());
   rows_.clear();
   return path.empty() || !platform::FileExists(path) || platform::DeleteFile(path);
 }

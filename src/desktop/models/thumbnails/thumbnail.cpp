@@ -16,7 +16,6 @@
 #include "platform/paths.h"
 #include "processing/geometry/scale.h"
 #include "registry/registry.h"
-#include "settings/settings.h"
 
 namespace fotomill::desktop {
 
@@ -41,6 +40,7 @@ class OpenDatabase {
  public:
   bool Find(const ThumbnailWish& wish, ThumbnailRecord& record) {
     const std::lock_guard lock(mutex_);
+    hidden_ = wish.options.hidden;
     return Open(DatabaseFor(wish), false) && database_.Find(wish.path, VolumeKeyFor(wish.path), record);
   }
   void Add(const ThumbnailWish& wish, const ThumbnailRecord& record) {
@@ -48,6 +48,7 @@ class OpenDatabase {
     const std::string path = DatabaseFor(wish);
     if (path != newPath_ || new_.size() >= kGathered) Write();
     newPath_ = path;
+    hidden_ = wish.options.hidden;
     new_.push_back({record, wish.path, VolumeKeyFor(wish.path), false});
   }
   void Flush() {
@@ -67,7 +68,7 @@ class OpenDatabase {
     if (path == openPath_) return true;
     openPath_.clear();
     database_.CloseThumbnailDatabase();
-    if (database_.OpenThumbnailDatabase(path, create) != ThumbnailDatabase::Opened::Done) return false;
+    if (database_.OpenThumbnailDatabase(path, create, hidden_) != ThumbnailDatabase::Opened::Done) return false;
     openPath_ = path;
     return true;
   }
@@ -79,6 +80,7 @@ class OpenDatabase {
 
   std::mutex mutex_;
   std::string openPath_, newPath_;
+  bool hidden_ = true;
   ThumbnailDatabase database_;
   std::vector<DatabaseRecord> new_;
 };
@@ -86,7 +88,7 @@ OpenDatabase openDatabase;
 
 bool FindRecord(const ThumbnailWish& wish, ThumbnailRecord& record) {
   if (wish.side > kSmallThumbnailSide) return false;  // a record would have to be enlarged
-  if (wish.mode == choice::kDiskBased || settings.AlwaysUseTHN != 0) {
+  if (wish.mode == choice::kDiskBased || wish.options.fromFiles) {
     if (ReadCurrentFile(wish, record)) return true;
   }
   return InDatabase(wish) && openDatabase.Find(wish, record);
@@ -100,29 +102,29 @@ Status ScaleDown(const PackedImage& image, int32_t side, RgbImage& pixels) {
   return ToRgb(scaled, pixels);
 }
 
-Status PixelsOfRecord(const ThumbnailRecord& record, int32_t side, RgbImage& pixels) {
+Status PixelsOfRecord(const ThumbnailRecord& record, const ThumbnailWish& wish, RgbImage& pixels) {
   PackedImage bitmap;
   RETURN_IF_BAD(ThumbnailRecordToBitmap(record, bitmap));
   RETURN_IF_BAD(ToRgb(bitmap, pixels));
-  pixels = WithoutMatte(pixels, static_cast<Color>(settings.ThumbnailMatte));
-  if (std::max(pixels.width, pixels.height) <= side) return Status::Ok;
+  pixels = WithoutMatte(pixels, wish.options.matte);
+  if (std::max(pixels.width, pixels.height) <= wish.side) return Status::Ok;
   RETURN_IF_BAD(ToPacked(pixels, bitmap));
-  return ScaleDown(bitmap, side, pixels);
+  return ScaleDown(bitmap, wish.side, pixels);
 }
 
-Status PixelsOfPicture(PictureRecord& picture, int32_t side, RgbImage& pixels) {
-  RETURN_IF_BAD(PrepareForDisplay(picture, static_cast<Color>(settings.ThumbnailMatte)));
-  return ScaleDown(picture.image, side, pixels);
+Status PixelsOfPicture(PictureRecord& picture, const ThumbnailWish& wish, RgbImage& pixels) {
+  RETURN_IF_BAD(PrepareForDisplay(picture, wish.options.matte));
+  return ScaleDown(picture.image, wish.side, pixels);
 }
 
 // A thumbnail that somebody has made before.
 bool TakeReady(const ThumbnailWish& wish, Thumbnail& thumbnail) {
   ThumbnailRecord record;
-  if (FindRecord(wish, record) && PixelsOfRecord(record, wish.side, thumbnail.pixels) == Status::Ok) return true;
+  if (FindRecord(wish, record) && PixelsOfRecord(record, wish, thumbnail.pixels) == Status::Ok) return true;
   const bool fromSystem =
-      wish.mode == choice::kDiskBased && settings.UseWindowsThumbnailCache != 0 && wish.side > kSmallThumbnailSide;
+      wish.mode == choice::kDiskBased && wish.options.fromSystem && wish.side > kSmallThumbnailSide;
   const PicturePointer picture = fromSystem ? ReadSystemPicture(wish.path, wish.side) : nullptr;
-  return picture != nullptr && PixelsOfPicture(*picture, wish.side, thumbnail.pixels) == Status::Ok;
+  return picture != nullptr && PixelsOfPicture(*picture, wish, thumbnail.pixels) == Status::Ok;
 }
 
 // The thumbnail in the file's EXIF, upright as the picture would be.
@@ -134,7 +136,7 @@ bool TakeEmbedded(const ThumbnailWish& wish, Thumbnail& thumbnail) {
   if (DecodeExifThumbnail(ExifThumbnail(source.Block(), findings), picture) != Status::Ok) return false;
   picture->metadata.exif.assign(source.Block().begin(), source.Block().end());
   thumbnail.standIn = true;
-  return PixelsOfPicture(*picture, wish.side, thumbnail.pixels) == Status::Ok && source.Intact();
+  return PixelsOfPicture(*picture, wish, thumbnail.pixels) == Status::Ok && source.Intact();
 }
 
 void TakeFacts(const PictureRecord& picture, Thumbnail& thumbnail) {
@@ -161,9 +163,9 @@ Status MakeFromPicture(const ThumbnailWish& wish, Thumbnail& thumbnail) {
   picture->thumbnailSide = wish.side;
   RETURN_IF_BAD(ReadPicture(*picture));
   thumbnail.alpha = !picture->alpha.Empty();
-  RETURN_IF_BAD(PrepareForDisplay(*picture, static_cast<Color>(settings.ThumbnailMatte)));
+  RETURN_IF_BAD(PrepareForDisplay(*picture, wish.options.matte));
   ThumbnailRecord record;
-  if (InDatabase(wish) && settings.AutoCreateThumbnail != 0 && MakeThumbnailRecord(record, *picture))
+  if (InDatabase(wish) && wish.options.keep && MakeThumbnailRecord(record, *picture, wish.options))
     openDatabase.Add(wish, record);
   return ScaleDown(picture->image, wish.side, thumbnail.pixels);
 }
@@ -194,10 +196,10 @@ void DropThumbnails(const std::string& path) {
   openDatabase.Drop(path, ThumbnailDatabasePath(std::string(platform::SplitPath(path).folder)));
 }
 
-Status WriteThumbnail(const std::string& path) {
+Status WriteThumbnail(const std::string& path, const ThumbnailOptions& options) {
   ThumbnailRecord record;
-  RETURN_IF_BAD(MakeThumbnailOfFile(path, record));
-  return WriteThumbnailFile(record, ThumbnailPathFor(path)) ? Status::Ok : Status::ErrorCreatingFile;
+  RETURN_IF_BAD(MakeThumbnailOfFile(path, options, record));
+  return WriteThumbnailFile(record, ThumbnailPathFor(path), options.hidden) ? Status::Ok : Status::ErrorCreatingFile;
 }
 
 }  // namespace fotomill::desktop

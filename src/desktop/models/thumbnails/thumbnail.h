@@ -4,6 +4,7 @@
 #include <memory>
 #include <string>
 
+#include "catalog/thumbnails/thumbnail_options.h"
 #include "core/status.h"
 #include "desktop/models/drawing/rgb_image.h"
 
@@ -17,6 +18,7 @@ struct ThumbnailWish {
   int32_t side = 96;     // pixels of the square that it must fit
   int32_t mode = 0;      // choice::ThumbnailMode: where records may be
   bool standIn = false;  // whatever can be had at once will do, until the proper one comes
+  ThumbnailOptions options = {};
 
   bool operator==(const ThumbnailWish&) const = default;
 };
@@ -51,6 +53,6 @@ void KeepThumbnailRecords();
 void DropThumbnails(const std::string& path);
 
 // Makes a picture's thumbnail record and writes its thumbnail file.
-Status WriteThumbnail(const std::string& path);
+Status WriteThumbnail(const std::string& path, const ThumbnailOptions& options);
 
 }  // namespace fotomill::desktop

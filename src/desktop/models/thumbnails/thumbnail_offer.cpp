@@ -10,7 +10,8 @@ namespace fotomill::desktop {
 
 class ThumbnailOffer::Face : public ThumbnailUpdateFace {
  public:
-  Face(ThumbnailOffer& offer, std::string folder) : offer_(offer), folder_(std::move(folder)) {}
+  Face(ThumbnailOffer& offer, const ThumbnailBrowser& browser)
+      : offer_(offer), folder_(browser.folder), options_(browser.options.making) {}
   bool changed = false;
 
   bool ShowProgress(const std::string&, size_t, size_t) override { return !offer_.stop_; }
@@ -26,7 +27,7 @@ class ThumbnailOffer::Face : public ThumbnailUpdateFace {
     std::atomic<int32_t> made{0};
     const auto work = [&] {
       for (size_t i = next++; i < files.size() && !offer_.stop_; i = next++) {
-        if (WriteThumbnail(platform::JoinFolder(folder_, files[i])) == Status::Ok) ++made;
+        if (WriteThumbnail(platform::JoinFolder(folder_, files[i]), options_) == Status::Ok) ++made;
         offer_.events_.building(++finished, files.size());
       }
     };
@@ -38,10 +39,12 @@ class ThumbnailOffer::Face : public ThumbnailUpdateFace {
     return made;
   }
   void Refresh() override {}
+  void KeepChoice(const ThumbnailUpdateOptions& options) override { offer_.events_.keep(options); }
 
  private:
   ThumbnailOffer& offer_;
   const std::string folder_;
+  const ThumbnailOptions options_;
 };
 
 std::shared_ptr<ThumbnailOffer> ThumbnailOffer::Start(ThumbnailBrowser browser, Events events) {
@@ -52,7 +55,7 @@ std::shared_ptr<ThumbnailOffer> ThumbnailOffer::Start(ThumbnailBrowser browser, 
 }
 
 void ThumbnailOffer::Run(ThumbnailBrowser browser) {
-  Face face(*this, browser.folder);
+  Face face(*this, browser);
   // Records of the list itself are not needed: the browser loads what it shows.
   if (browser.mode == choice::kVirtual) browser.mode = choice::kDiskBased;
   (void)OfferThumbnailUpdate(browser, face);

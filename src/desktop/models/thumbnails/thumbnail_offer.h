@@ -19,6 +19,7 @@ class ThumbnailOffer : public std::enable_shared_from_this<ThumbnailOffer> {
   // Called on the offer's thread.
   struct Events {
     std::function<void(int32_t count, int32_t selected)> ask;
+    std::function<void(const ThumbnailUpdateOptions& options)> keep;  // the choice, for later offers
     std::function<void(size_t done, size_t total)> building;
     std::function<void(bool changed, const ThumbnailBrowser& browser)> ended;
   };

@@ -52,8 +52,8 @@ void CollectOrphans(const std::string& folder, int depth, const std::atomic<bool
 
 }  // namespace
 
-DatabaseCompaction::DatabaseCompaction(std::string path, bool purge)
-    : path_(std::move(path)), thread_([this, purge] { Run(purge); }) {}
+DatabaseCompaction::DatabaseCompaction(std::string path, bool purge, bool hidden)
+    : path_(std::move(path)), hidden_(hidden), thread_([this, purge] { Run(purge); }) {}
 
 DatabaseCompaction::~DatabaseCompaction() {
   Stop();
@@ -68,7 +68,7 @@ void DatabaseCompaction::Step(int32_t done, int32_t total) {
 void DatabaseCompaction::Run(bool purge) {
   ThumbnailDatabase database;
   DatabaseHeader before, after;
-  if (database.OpenThumbnailDatabase(path_, false) != Opened::Done || !database.ReadDatabaseHeader(before)) {
+  if (database.OpenThumbnailDatabase(path_, false, hidden_) != Opened::Done || !database.ReadDatabaseHeader(before)) {
     outcome_ = platform::FileExists(path_) ? kNoDatabase : "There is no thumbnail database of that name.";
   } else {
     const uint64_t size = platform::FactsOf(path_).size;

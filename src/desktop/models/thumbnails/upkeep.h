@@ -14,8 +14,9 @@ namespace fotomill::desktop {
 // Compaction of one thumbnail database on a thread of its own, for a window that shows how far it is.
 class DatabaseCompaction : private ProgressSink {
  public:
-  // Begins at once; `purge` drops the thumbnails of missing pictures as well.
-  DatabaseCompaction(std::string path, bool purge);
+  // Begins at once; `purge` drops the thumbnails of missing pictures as well; with `hidden` the
+  // new file is hidden.
+  DatabaseCompaction(std::string path, bool purge, bool hidden);
   // Stops it and waits; the database is then as it was, unless it was done.
   ~DatabaseCompaction() override;
   DatabaseCompaction(const DatabaseCompaction&) = delete;
@@ -36,6 +37,7 @@ class DatabaseCompaction : private ProgressSink {
   void Run(bool purge);
 
   const std::string path_;
+  const bool hidden_;
   std::atomic<bool> stop_{false}, ended_{false};
   std::atomic<int32_t> done_{0}, total_{0};
   bool succeeded_ = false;  // written before `ended_`

@@ -14,6 +14,7 @@
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/clock.h"
 #include "platform/paths.h"
+#include "settings/job_options.h"
 #include "settings/settings.h"
 
 namespace fotomill::desktop {
@@ -109,6 +110,7 @@ ThumbnailWish ThumbnailCanvas::WishOf(size_t line) const {
   wish.size = item.size;
   wish.side = static_cast<int32_t>(std::lround(square_ * GetContentScaleFactor()));
   wish.mode = model_.Modes().thumbnails;
+  wish.options = ThumbnailOptionsFromSettings();
   return wish;
 }
 

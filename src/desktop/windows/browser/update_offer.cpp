@@ -4,6 +4,7 @@
 
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/browser/update_bar.h"
+#include "settings/job_options.h"
 
 namespace fotomill::desktop {
 
@@ -30,6 +31,7 @@ void UpdateOffer::Offer(const std::string& folder, std::vector<std::string> file
   browser.view = static_cast<choice::ViewMode>(modes.view);
   browser.asks = asks_;
   browser.lastCompaction = lastCompaction_;
+  browser.options = ThumbnailUpdateOptionsFromSettings();
   // What the offer tells of a folder that was left meanwhile is dropped.
   const auto weak = std::make_shared<std::weak_ptr<ThumbnailOffer>>();
   const auto post = [weak](std::function<void()> action) {
@@ -44,6 +46,9 @@ void UpdateOffer::Offer(const std::string& folder, std::vector<std::string> file
       ShowBar(true);
       LogEvent("offer", std::to_string(count));
     });
+  };
+  events.keep = [](const ThumbnailUpdateOptions& options) {  // wherever the frame has gone since
+    wxTheApp->CallAfter([options] { StoreThumbnailUpdate(options); });
   };
   events.building = [this, post](size_t done, size_t total) {
     post([this, done, total] {

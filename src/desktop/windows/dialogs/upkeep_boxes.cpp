@@ -8,9 +8,11 @@
 #include <wx/sizer.h>
 #include <wx/stattext.h>
 
+#include "catalog/thumbnails/thumbnail_options.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/files.h"
+#include "settings/job_options.h"
 
 namespace fotomill::desktop {
 
@@ -70,7 +72,8 @@ CompactionBox::CompactionBox(wxWindow* parent, const std::string& folder)
 void CompactionBox::Begin() {
   if (compaction_ != nullptr && !compaction_->Ended()) return;
   outcome_->SetLabel("Compacting...");
-  compaction_ = std::make_unique<DatabaseCompaction>(paths_[which_->GetSelection()], purge_->GetValue());
+  compaction_ = std::make_unique<DatabaseCompaction>(paths_[which_->GetSelection()], purge_->GetValue(),
+                                                     ThumbnailOptionsFromSettings().hidden);
   timer_.Start(kLookMs);
   UpdateControls();
 }

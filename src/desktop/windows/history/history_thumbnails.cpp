@@ -8,6 +8,7 @@
 #include "core/choice_lists.h"
 #include "desktop/models/history/file_history_list.h"
 #include "platform/files.h"
+#include "settings/job_options.h"
 
 namespace fotomill::desktop {
 
@@ -44,7 +45,7 @@ void HistoryThumbnails::Want(const std::vector<std::string>& paths, int side, do
     if (side == 0 || bitmaps_.contains(path) || !GetsThumbnail(path)) continue;
     const platform::FileFacts facts = platform::FactsOf(path);
     if (facts.kind != platform::FileKind::Regular) continue;
-    wishes.push_back({path, facts.modified, facts.size, side, choice::kDiskBased});
+    wishes.push_back({path, facts.modified, facts.size, side, choice::kDiskBased, false, ThumbnailOptionsFromSettings()});
   }
   loader_.Want(std::move(wishes));
 }

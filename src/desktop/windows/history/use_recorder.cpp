@@ -2,6 +2,8 @@
 
 #include <utility>
 
+#include "settings/job_options.h"
+
 namespace fotomill::desktop {
 
 namespace {
@@ -20,7 +22,7 @@ void UseRecorder::Note(const std::vector<FileUse>& uses) {
 }
 
 void UseRecorder::Flush() {
-  if (!uses_.empty()) (void)UpdateFileHistory(std::exchange(uses_, {}));
+  if (!uses_.empty()) (void)UpdateFileHistory(HistoryOptionsFromSettings(), std::exchange(uses_, {}));
 }
 
 }  // namespace fotomill::desktop

@@ -1,0 +1,24 @@
+#pragma once
+
+#include <cstdint>
+
+#include "core/choice_lists.h"
+#include "picture/picture_record.h"
+
+namespace fotomill {
+
+// How thumbnails are made, kept and shown.
+struct ThumbnailOptions {
+  bool quick = false;       // records are scaled by the quick scaler
+  Color matte = 0xCCCCCC;   // around pictures and behind their alpha
+  bool hidden = true;       // thumbnail files and databases are hidden
+  bool fromFiles = true;    // thumbnail files serve in the database and virtual modes as well
+  bool fromSystem = true;   // large ones may come from the system's own thumbnails
+  bool keep = true;         // what was made for a browser goes into its database
+  bool fastZoom = false;    // small records are enlarged by spreading their pixels
+  int32_t zoomFilter = choice::kBicubic;  // else by this choice::ResampleFilter
+
+  bool operator==(const ThumbnailOptions&) const = default;
+};
+
+}  // namespace fotomill
