@@ -164,7 +164,7 @@ TEST(BrowserModel, TypingFinds) {
   EXPECT_EQ(model.FindTyped("x", true), kNoLine);
   model.SelectMatching("*c.png", MatchMode::Only);
   model.SelectMatching("a*", MatchMode::Add);
-  model.SelectMatching("ad", MatchMode::TakeOut);
+  model.SelectMatching("ad", MatchMode::Remove);
   EXPECT_EQ(Shown(model), "[ab.png*] ac.png* Ad.png b.png");
   model.SelectMatching("", MatchMode::Only);
   EXPECT_EQ(model.CountText(), "4 files, 600 bytes");

@@ -159,7 +159,7 @@ TEST_F(Reports, HistorySortsRemovesAndForgets) {
                           {Sample("B.bmp"), FileFunction::Crop, 200, 200}};
   ASSERT_EQ(UpdateFileHistory(HistoryOptionsFromSettings(), uses), HistoryUpdate::Done);
   FileHistoryList list;
-  EXPECT_TRUE(list.Take());
+  EXPECT_TRUE(list.Read());
   const auto names = [&] {
     std::vector<std::string> shown;
     for (size_t row = 0; row < list.Count(); ++row) shown.push_back(list.Cell(row, choice::kColumnName));
@@ -184,7 +184,7 @@ TEST_F(Reports, HistorySortsRemovesAndForgets) {
   EXPECT_TRUE(list.Clear());
   EXPECT_FALSE(platform::FileExists(FileHistoryPath(HistoryOptionsFromSettings())));
   test::WriteText(FileHistoryPath(HistoryOptionsFromSettings()), "no history at all");
-  EXPECT_FALSE(list.Take());
+  EXPECT_FALSE(list.Read());
 }
 
 TEST_F(Reports, CompactionTellsWhatItDid) {

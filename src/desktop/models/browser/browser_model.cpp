@@ -206,7 +206,7 @@ std::vector<std::string> BrowserModel::ShownFiles() const {
 void BrowserModel::SelectMatching(std::string_view pattern, MatchMode mode) {
   for (size_t line = 0; line < lines_.size(); ++line) {
     const bool matches = !pattern.empty() && MatchesFilter(Line(line).name, pattern);
-    if (matches || mode == MatchMode::Only) selection_.Set(line, matches && mode != MatchMode::TakeOut);
+    if (matches || mode == MatchMode::Only) selection_.Set(line, matches && mode != MatchMode::Remove);
   }
 }
 

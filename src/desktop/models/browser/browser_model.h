@@ -13,7 +13,7 @@
 namespace fotomill::desktop {
 
 // What becomes of the selection of lines whose names match a pattern: they alone are selected, they as well, or not any more.
-enum class MatchMode { Only, Add, TakeOut };
+enum class MatchMode { Only, Add, Remove };
 
 // What one browser shows: the items of a folder in their order, those that pass the filter as lines, and the selection
 // among the lines. No window, no file access.

@@ -22,7 +22,7 @@ bool FitsLine(std::string_view folder) {
 }
 
 // A number up to `last` in front of a comma, taken off the line.
-std::optional<int32_t> TakeField(std::string_view& line, int32_t last) {
+std::optional<int32_t> ReadField(std::string_view& line, int32_t last) {
   const size_t comma = line.find(',');
   if (comma == std::string_view::npos) return std::nullopt;
   const auto number = ParseNumber(line.substr(0, comma));
@@ -74,9 +74,9 @@ FolderViews FolderViews::Parse(std::string_view text) {
     std::string_view line = text.substr(0, end);
     text.remove_prefix(std::min(end + 1, text.size()));
     if (line.ends_with('\r')) line.remove_suffix(1);
-    const auto view = TakeField(line, choice::kViewLarge);
-    const auto sort = TakeField(line, choice::kSortDimensions);
-    const auto descending = TakeField(line, 1);
+    const auto view = ReadField(line, choice::kViewLarge);
+    const auto sort = ReadField(line, choice::kSortDimensions);
+    const auto descending = ReadField(line, 1);
     if (!view || !sort || !descending || !FitsLine(line)) continue;
     views.entries_.push_back({std::string(line), {{0, *view, *sort}, *descending != 0}});
   }

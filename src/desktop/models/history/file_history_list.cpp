@@ -56,7 +56,7 @@ int Compare(const HistoryRow& a, const HistoryRow& b, int32_t column) {
 
 std::span<const HistoryColumnFacts> HistoryColumns() { return kColumns; }
 
-bool FileHistoryList::Take() {
+bool FileHistoryList::Read() {
   rows_.clear();
   ClearFileHistory();
   const bool read = LoadFileHistory(HistoryOptionsFromSettings());

@@ -33,7 +33,7 @@ class FileHistoryList {
  public:
   // Takes up the history as its file has it now, and sorts it as FileHistorySortMode says. False when there is a file that
   // cannot be read as one.
-  bool Take();
+  bool Read();
   // Sorts by a column; the one that sorts already, the other way round. Times and sizes begin with the largest.
   void SortBy(int32_t column);
   int32_t SortColumn() const { return column_; }

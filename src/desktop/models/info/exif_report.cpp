@@ -36,7 +36,7 @@ class Gather : public ExifSink {
   ExifText text_;
 };
 
-void TakeThumbnail(std::span<const uint8_t> bytes, ExifReport& report) {
+void ReadThumbnail(std::span<const uint8_t> bytes, ExifReport& report) {
   report.thumbnailBytes.assign(bytes.begin(), bytes.end());
   PicturePointer picture;
   if (bytes.empty() || DecodeExifThumbnail(bytes, picture) != Status::Ok) return;
@@ -65,7 +65,7 @@ ExifReport ReadExifReport(const std::string& path, const ExifTextOptions& option
     return report;
   }
   gather.Finish();
-  TakeThumbnail(ExifThumbnail(source.Block(), findings), report);
+  ReadThumbnail(ExifThumbnail(source.Block(), findings), report);
   if (!source.Intact()) {
     report.status = Status::FileReadError;
     report.problem = "The file became shorter while it was read, so some of this may be wrong.";

@@ -24,7 +24,7 @@ std::string_view EntryOf(std::string_view page, std::string_view title) {
   return rest.substr(0, rest.find("\n#"));
 }
 
-std::string_view TakeLine(std::string_view& text) {
+std::string_view ReadLine(std::string_view& text) {
   const std::string_view line = text.substr(0, text.find('\n'));
   text.remove_prefix(line.size() == text.size() ? line.size() : line.size() + 1);
   return line;
@@ -68,7 +68,7 @@ std::string PlainText(std::string_view page) {
   std::string text;
   bool paragraph = false;
   while (!page.empty()) {
-    std::string_view line = TakeLine(page);
+    std::string_view line = ReadLine(page);
     if (IsLeftOut(line)) continue;
     if (line.empty()) {
       if (!text.empty() && !text.ends_with("\n\n")) text += text.ends_with('\n') ? "\n" : "\n\n";
@@ -86,7 +86,7 @@ std::string PlainText(std::string_view page) {
 }
 
 HelpText WholePage(std::string_view page) {
-  const std::string_view title = TakeLine(page);
+  const std::string_view title = ReadLine(page);
   return {std::string(title.substr(title.find_first_not_of("# "))), PlainText(page)};
 }
 

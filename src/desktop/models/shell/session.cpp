@@ -20,7 +20,7 @@ int32_t Number(std::string_view value) {
   return static_cast<int32_t>(std::clamp<int64_t>(LeadingInteger(value), INT32_MIN, INT32_MAX));
 }
 
-void TakeFrameValue(Session& session, std::string_view key, std::string_view value) {
+void ReadFrameValue(Session& session, std::string_view key, std::string_view value) {
   if (key == "Width") session.width = Number(value);
   if (key == "Height") session.height = Number(value);
   if (key == "Maximized") session.maximized = Number(value) != 0;
@@ -28,7 +28,7 @@ void TakeFrameValue(Session& session, std::string_view key, std::string_view val
   if (key == "Tab") session.tab = static_cast<size_t>(std::max(Number(value), 0));
 }
 
-void TakeTabValue(SessionTab& tab, std::string_view key, std::string_view value) {
+void ReadTabValue(SessionTab& tab, std::string_view key, std::string_view value) {
   if (key == "Folder") tab.folder = value;
   if (key == "ThumbnailMode") tab.view.modes.thumbnails = Number(value);
   if (key == "ViewMode") tab.view.modes.view = Number(value);
@@ -58,9 +58,9 @@ Session ParseSession(std::string_view text) {
     const size_t equals = line.find('=');
     if (equals == std::string_view::npos) continue;
     if (inTab) {
-      TakeTabValue(session.tabs.back(), line.substr(0, equals), line.substr(equals + 1));
+      ReadTabValue(session.tabs.back(), line.substr(0, equals), line.substr(equals + 1));
     } else {
-      TakeFrameValue(session, line.substr(0, equals), line.substr(equals + 1));
+      ReadFrameValue(session, line.substr(0, equals), line.substr(equals + 1));
     }
   }
   std::erase_if(session.tabs, [](const SessionTab& tab) { return tab.folder.empty(); });

@@ -118,7 +118,7 @@ Status PixelsOfPicture(PictureRecord& picture, const ThumbnailWish& wish, RgbIma
 }
 
 // A thumbnail that somebody has made before.
-bool TakeReady(const ThumbnailWish& wish, Thumbnail& thumbnail) {
+bool ReadReady(const ThumbnailWish& wish, Thumbnail& thumbnail) {
   ThumbnailRecord record;
   if (FindRecord(wish, record) && PixelsOfRecord(record, wish, thumbnail.pixels) == Status::Ok) return true;
   const bool fromSystem =
@@ -128,7 +128,7 @@ bool TakeReady(const ThumbnailWish& wish, Thumbnail& thumbnail) {
 }
 
 // The thumbnail in the file's EXIF, upright as the picture would be.
-bool TakeEmbedded(const ThumbnailWish& wish, Thumbnail& thumbnail) {
+bool ReadEmbedded(const ThumbnailWish& wish, Thumbnail& thumbnail) {
   ExifSource source;
   ExifFindings findings;
   if (source.Open(wish.path.c_str()) != Status::Ok || !WalkExif(source.Block(), nullptr, &findings)) return false;
@@ -139,7 +139,7 @@ bool TakeEmbedded(const ThumbnailWish& wish, Thumbnail& thumbnail) {
   return PixelsOfPicture(*picture, wish, thumbnail.pixels) == Status::Ok && source.Intact();
 }
 
-void TakeFacts(const PictureRecord& picture, Thumbnail& thumbnail) {
+void CopyFacts(const PictureRecord& picture, Thumbnail& thumbnail) {
   thumbnail.width = picture.width;
   thumbnail.height = picture.height;
   thumbnail.bits = picture.bitsPerPixel;
@@ -149,17 +149,17 @@ void TakeFacts(const PictureRecord& picture, Thumbnail& thumbnail) {
 }
 
 // What a record does not know of files that may have several pages: it is quickly told by their heads.
-void TellPages(const std::string& path, Thumbnail& thumbnail) {
+void ReadPages(const std::string& path, Thumbnail& thumbnail) {
   const int32_t format = FindFormatByName(path);
   PicturePointer picture;
   if (format == kNoFormat || format == kSpareRow || (FormatRow(format).flags & FMT_MULTI) == 0) return;
-  if (LoadPictureInfo(path.c_str(), picture) == Status::Ok) TakeFacts(*picture, thumbnail);
+  if (LoadPictureInfo(path.c_str(), picture) == Status::Ok) CopyFacts(*picture, thumbnail);
 }
 
 Status MakeFromPicture(const ThumbnailWish& wish, Thumbnail& thumbnail) {
   PicturePointer picture;
   RETURN_IF_BAD(LoadPictureInfo(wish.path.c_str(), picture));
-  TakeFacts(*picture, thumbnail);
+  CopyFacts(*picture, thumbnail);
   picture->thumbnailSide = wish.side;
   RETURN_IF_BAD(ReadPicture(*picture));
   thumbnail.alpha = !picture->alpha.Empty();
@@ -174,11 +174,11 @@ Status MakeFromPicture(const ThumbnailWish& wish, Thumbnail& thumbnail) {
 
 ThumbnailPointer LoadThumbnail(const ThumbnailWish& wish) {
   auto thumbnail = std::make_shared<Thumbnail>();
-  if (TakeReady(wish, *thumbnail)) {
-    TellPages(wish.path, *thumbnail);
+  if (ReadReady(wish, *thumbnail)) {
+    ReadPages(wish.path, *thumbnail);
     return thumbnail;
   }
-  if (wish.standIn) return TakeEmbedded(wish, *thumbnail) ? thumbnail : nullptr;
+  if (wish.standIn) return ReadEmbedded(wish, *thumbnail) ? thumbnail : nullptr;
   thumbnail->status = MakeFromPicture(wish, *thumbnail);
   if (thumbnail->status != Status::Ok) thumbnail->pixels = {};
   return thumbnail;

@@ -45,11 +45,11 @@ void BatchRunner::Run(BatchJob job, BatchThread::Work work, std::shared_ptr<Prev
     StartNext();
   } else {
     shell_.Report("The batch begins when the one before has ended.");
-    TellWaiting();
+    ReportWaiting();
   }
 }
 
-void BatchRunner::TellWaiting() {
+void BatchRunner::ReportWaiting() {
   LogEvent("batch", "waiting=" + std::to_string(waiting_.size()));
   if (box_ != nullptr) box_->SetWaiting(waiting_.size());
 }
@@ -90,7 +90,7 @@ void BatchRunner::BatchOpened() {
   LeaveBox();
   box_ = new ProgressWindow(&shell_.Window(), shell_.Thumbnails(), events);
   box_->Show();
-  TellWaiting();
+  ReportWaiting();
   LogEvent("batch", "opened");
 }
 

@@ -36,7 +36,7 @@ class BatchRunner : public wxEvtHandler, public BatchWindows {
     std::shared_ptr<PreviousFiles> previous;
   };
   void StartNext();
-  void TellWaiting();
+  void ReportWaiting();
   void LeaveBox();
   void CloseBox();
 

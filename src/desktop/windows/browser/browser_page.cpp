@@ -33,8 +33,8 @@ BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& 
       host_(host),
       thumbnails_(thumbnails),
       base_(view),
-      reader_({[this](FolderListing listing, bool complete) { TakeListing(std::move(listing), complete); },
-               [this](const PlacedItems& found, bool last) { TakeFacts(found, last); }}),
+      reader_({[this](FolderListing listing, bool complete) { ShowListing(std::move(listing), complete); },
+               [this](const PlacedItems& found, bool last) { ShowFacts(found, last); }}),
       watch_([this] { Reload(); }),
       offer_(this, {[this] { FocusList(); }, [this] { canvas_->WantThumbnails(); }}) {
   model_.SetView(view);
@@ -114,7 +114,7 @@ void BrowserPage::ShowFolder(const std::string& folder, const std::string& focus
   watch_.Watch({});
   offer_.Forget();
   model_.SetFolder(folder);
-  TakeViewOf(folder);
+  UseViewOf(folder);
   filter_->ChangeValue("");
   path_->ShowFolder(folder);
   canvas_->ScrollTo(0);
@@ -124,7 +124,7 @@ void BrowserPage::ShowFolder(const std::string& folder, const std::string& focus
 }
 
 // How the folder was last asked to be shown, else as all folders are here; what the folder itself says wins, and goes on.
-void BrowserPage::TakeViewOf(const std::string& folder) {
+void BrowserPage::UseViewOf(const std::string& folder) {
   const FolderView kept = host_.Views().Find(folder, base_);
   FolderView view = kept;
   view.modes = ModesForFolder(folder, kept.modes);
@@ -134,7 +134,7 @@ void BrowserPage::TakeViewOf(const std::string& folder) {
 
 void BrowserPage::Reload() { reader_.List(model_.Folder(), model_.ItemCount() == 0); }
 
-void BrowserPage::TakeListing(FolderListing listing, bool complete) {
+void BrowserPage::ShowListing(FolderListing listing, bool complete) {
   const size_t count = listing.items.size();
   model_.SetItems(std::move(listing.items));
   LogEvent(complete ? "listed" : "names", std::to_string(count) + " " + model_.Folder());
@@ -184,7 +184,7 @@ void BrowserPage::StartFacts() {
   if (!wanted.empty()) reader_.ReadFacts(model_.Folder(), std::move(wanted));
 }
 
-void BrowserPage::TakeFacts(const PlacedItems& found, bool last) {
+void BrowserPage::ShowFacts(const PlacedItems& found, bool last) {
   for (const auto& [item, known] : found) model_.SetFacts(item, known);
   const int32_t sort = model_.Modes().sort;
   if (last && (sort == choice::kSortExifDate || sort == choice::kSortDimensions)) {

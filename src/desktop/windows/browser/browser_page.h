@@ -87,15 +87,15 @@ class BrowserPage : public wxPanel {
   void BuildFilter();
   void BuildViews();
   void ShowFolder(const std::string& folder, const std::string& focus);
-  void TakeListing(FolderListing listing, bool complete);
+  void ShowListing(FolderListing listing, bool complete);
   void OfferThumbnails();
   void StartFacts();
-  void TakeFacts(const PlacedItems& found, bool last);
+  void ShowFacts(const PlacedItems& found, bool last);
   bool NeedsFacts() const;
   bool ShowsDetails() const;
   void ShowView();
   void ShowLines();
-  void TakeViewOf(const std::string& folder);
+  void UseViewOf(const std::string& folder);
   void ShowAs(const FolderView& view);
   void ChooseView(const FolderView& view);
   void ThumbnailsCame(const std::vector<ThumbnailLoader::Result>& results);

@@ -42,9 +42,9 @@ FolderTree::FolderTree(wxWindow* parent, const Favourites& favourites, Events ev
                  wxDefaultValidator, "Folders"),
       favourites_(favourites),
       events_(std::move(events)) {
-  TakeImages();
+  LoadImages();
   Bind(wxEVT_SYS_COLOUR_CHANGED, [this](wxSysColourChangedEvent& event) {
-    TakeImages();
+    LoadImages();
     event.Skip();
   });
   AddRoot("");
@@ -66,7 +66,7 @@ FolderTree::FolderTree(wxWindow* parent, const Favourites& favourites, Events ev
 }
 
 // In the color of texts.
-void FolderTree::TakeImages() {
+void FolderTree::LoadImages() {
   wxVector<wxBitmapBundle> images;
   for (const char* symbol : {"folder", "home", "favourite", "volume"}) images.push_back(Symbol(symbol));
   SetImages(images);
@@ -159,13 +159,13 @@ void FolderTree::Read(std::vector<std::string> folders) {
     for (const std::string& folder : folders) {
       if (alive.expired()) return;
       wxTheApp->CallAfter([this, alive, folder, names = SubfolderNames(folder)] {
-        if (!alive.expired()) TakeNames(folder, names);
+        if (!alive.expired()) ShowNames(folder, names);
       });
     }
   }).detach();
 }
 
-void FolderTree::TakeNames(const std::string& folder, const std::vector<std::string>& names) {
+void FolderTree::ShowNames(const std::string& folder, const std::vector<std::string>& names) {
   // A folder may hang in the tree more than once: under a place of its own and under the file system.
   for (const wxTreeItemId& place : ChildrenOf(GetRootItem())) {
     wxTreeItemId item = place;

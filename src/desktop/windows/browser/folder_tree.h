@@ -39,13 +39,13 @@ class FolderTree : public wxTreeCtrl {
   std::string FolderAt(const wxPoint& point) const;
 
  private:
-  void TakeImages();
+  void LoadImages();
   struct Place;
   std::vector<Place> Places() const;
   std::vector<wxTreeItemId> ChildrenOf(const wxTreeItemId& item) const;
   void Fill(const wxTreeItemId& item);
   void Read(std::vector<std::string> folders);
-  void TakeNames(const std::string& folder, const std::vector<std::string>& names);
+  void ShowNames(const std::string& folder, const std::vector<std::string>& names);
   void MergeNames(const wxTreeItemId& item, const std::string& folder, const std::vector<std::string>& names);
   // Goes on along the way to the followed folder as far as folders have been read.
   void FollowOn();

@@ -64,7 +64,7 @@ void PathBar::BuildEdit() {
   edit_ = new wxTextCtrl(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxTE_PROCESS_ENTER, wxDefaultValidator, "Folder");
   edit_->Bind(wxEVT_TEXT, [this](wxCommandEvent&) { ReadNames(); });
   edit_->Hide();
-  edit_->Bind(wxEVT_TEXT_ENTER, [this](wxCommandEvent&) { TakeTyped(); });
+  edit_->Bind(wxEVT_TEXT_ENTER, [this](wxCommandEvent&) { OpenTyped(); });
   edit_->Bind(wxEVT_KEY_DOWN, [this](wxKeyEvent& event) {
     if (event.GetKeyCode() == WXK_DOWN) return ShowCompletion(1);
     if (event.GetKeyCode() == WXK_UP) return ShowCompletion(-1);
@@ -150,7 +150,7 @@ void PathBar::ShowEdit(bool show) {
   Layout();
 }
 
-void PathBar::TakeTyped() {
+void PathBar::OpenTyped() {
   if (!platform::IsFolder(FolderTyped(Utf8(edit_->GetValue())))) ShowCompletion(0);
   const std::string folder = FolderTyped(Utf8(edit_->GetValue()));
   if (!platform::IsFolder(folder)) return wxBell();

@@ -44,7 +44,7 @@ class PathBar : public wxPanel {
   wxString Typed() const;
   void CompleteTyped();
   void ShowCompletion(int step);
-  void TakeTyped();
+  void OpenTyped();
   void OfferSteps(wxWindow& button, int direction);
 
   const FolderTrail& trail_;

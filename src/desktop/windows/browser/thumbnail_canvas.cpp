@@ -94,7 +94,7 @@ void ThumbnailCanvas::ModelChanged() {
   scroll_ = std::clamp<int64_t>(scroll_, 0, layout_.LargestScroll());
   UpdateScrollbar();
   WantThumbnails();
-  TellFocus();
+  ReportFocus();
   Refresh();
 }
 
@@ -234,15 +234,15 @@ void ThumbnailCanvas::OnWheel(wxMouseEvent& event) {
 size_t ThumbnailCanvas::LineAt(const wxPoint& point) const { return layout_.LineAt(point.x, point.y + scroll_); }
 
 // Screen readers know the canvas by the file with the focus, and say it again when that changes.
-void ThumbnailCanvas::TellFocus() {
+void ThumbnailCanvas::ReportFocus() {
   const wxString focus = Shown(model_.FocusText());
   const wxString count = Shown(std::to_string(model_.Selected().SelectedCount()) + " selected");
-  TellScreenReader(*this, focus.empty() ? wxString("Thumbnails") : focus, "Thumbnails, " + count);
+  ReportToScreenReader(*this, focus.empty() ? wxString("Thumbnails") : focus, "Thumbnails, " + count);
 }
 
-void ThumbnailCanvas::TellSelection() {
+void ThumbnailCanvas::ReportSelection() {
   Refresh();
-  TellFocus();
+  ReportFocus();
   if (events_.selectionChanged) events_.selectionChanged();
 }
 
@@ -257,12 +257,12 @@ void ThumbnailCanvas::OnMouseDown(wxMouseEvent& event) {
   if (line == kNoLine) {
     const bool keep = event.ControlDown() || event.ShiftDown();
     if (!keep) selection.ClickBlank(settings.ClearAllOnBlankClick != 0);
-    return TellSelection();
+    return ReportSelection();
   }
   // A press on a selected line may begin a drag of all; what a plain click does is done when the button goes up.
   if (selection.IsSelected(line) && !event.ControlDown() && !event.ShiftDown()) return;
   selection.Click(line, event.ShiftDown(), event.ControlDown());
-  TellSelection();
+  ReportSelection();
 }
 
 void ThumbnailCanvas::OnMouseUp(wxMouseEvent& event) {
@@ -271,7 +271,7 @@ void ThumbnailCanvas::OnMouseUp(wxMouseEvent& event) {
   const bool click = pressed_ && !banding_ && pressedLine_ != kNoLine && !event.ControlDown() && !event.ShiftDown();
   if (click && LineAt(event.GetPosition()) == pressedLine_) {
     model_.Selected().Click(pressedLine_, false, false);
-    TellSelection();
+    ReportSelection();
   }
   pressed_.reset();
   banding_ = false;
@@ -298,7 +298,7 @@ void ThumbnailCanvas::OnMouseMove(wxMouseEvent& event) {
   bandEnd_ = now;
   const Rect band{std::min(pressed_->x, now.x), std::min(pressed_->y, now.y), std::abs(way.x) + 1, std::abs(way.y) + 1};
   selection.MoveBand(layout_.LinesIn(band));
-  TellSelection();
+  ReportSelection();
 }
 
 void ThumbnailCanvas::OnDoubleClick(wxMouseEvent& event) {
@@ -312,7 +312,7 @@ void ThumbnailCanvas::OnRightDown(wxMouseEvent& event) {
   const size_t line = LineAt(event.GetPosition());
   model_.Selected().ContextClick(line);
   if (line == kNoLine) model_.Selected().ClickBlank(settings.ClearAllOnBlankClick != 0);
-  TellSelection();
+  ReportSelection();
   if (events_.contextMenu) events_.contextMenu(line, event.GetPosition());
 }
 
@@ -329,7 +329,7 @@ void ThumbnailCanvas::MoveFocus(Step step, const wxKeyEvent& event) {
   if (line == kNoLine) return;
   model_.Selected().MoveFocus(line, event.ShiftDown(), event.ControlDown());
   ShowLine(line);
-  TellSelection();
+  ReportSelection();
 }
 
 void ThumbnailCanvas::OnKey(wxKeyEvent& event) {
@@ -358,7 +358,7 @@ void ThumbnailCanvas::OnKey(wxKeyEvent& event) {
   if (enter && !event.HasAnyModifiers() && focus != kNoLine) return events_.activated(focus);
   if (event.GetKeyCode() == WXK_SPACE && typed_.empty()) {
     model_.Selected().ToggleFocus();
-    return TellSelection();
+    return ReportSelection();
   }
   event.Skip();
 }
@@ -377,7 +377,7 @@ void ThumbnailCanvas::OnChar(wxKeyEvent& event) {
   if (line == kNoLine) return;
   model_.Selected().MoveFocus(line, false, false);
   ShowLine(line);
-  TellSelection();
+  ReportSelection();
 }
 
 // --- renaming in place ---

@@ -73,8 +73,8 @@ class ThumbnailCanvas : public wxWindow {
   std::vector<ThumbnailWish> StandInsFor(const CellLayout::Range& lines) const;
   size_t LineAt(const wxPoint& point) const;
   void MoveFocus(Step step, const wxKeyEvent& event);
-  void TellFocus();
-  void TellSelection();
+  void ReportFocus();
+  void ReportSelection();
   void UpdateScrollbar();
   void UpdateTip(size_t line);
   void FinishEdit(bool accept);

@@ -62,7 +62,7 @@ void UpdateBar::Ask(int32_t count, int32_t selected) {
   GetParent()->Layout();
 }
 
-void UpdateBar::Tell(const wxString& text) {
+void UpdateBar::Report(const wxString& text) {
   text_->SetLabel(text);
   choices_->Hide();
   ok_->Hide();

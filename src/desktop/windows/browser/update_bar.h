@@ -16,7 +16,7 @@ class UpdateBar : public wxPanel {
   UpdateBar(wxWindow* parent, std::function<void(int32_t choice)> answered);
   void Ask(int32_t count, int32_t selected);
   // What is going on instead of a question; closing the bar ends it.
-  void Tell(const wxString& text);
+  void Report(const wxString& text);
 
  private:
   const std::function<void(int32_t choice)> answered_;

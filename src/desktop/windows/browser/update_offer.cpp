@@ -52,7 +52,7 @@ void UpdateOffer::Offer(const std::string& folder, std::vector<std::string> file
   };
   events.building = [this, post](size_t done, size_t total) {
     post([this, done, total] {
-      bar_->Tell(wxString::Format("Creating thumbnails: %zu of %zu", done, total));
+      bar_->Report(wxString::Format("Creating thumbnails: %zu of %zu", done, total));
       ShowBar(done < total);
     });
   };

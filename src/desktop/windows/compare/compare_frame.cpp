@@ -158,7 +158,7 @@ void CompareFrame::WantPictures() {
 void CompareFrame::PicturesCame() {
   for (Pane& pane : panes_) {
     const ViewPicturePointer ready = loader_->Find(WishOf(pane));
-    if (ready != nullptr && ready != pane.canvas->Picture()) TakePicture(pane, ready);
+    if (ready != nullptr && ready != pane.canvas->Picture()) ShowPicture(pane, ready);
   }
 }
 
@@ -170,7 +170,7 @@ void CompareFrame::FilesChanged() {
   WantPictures();
 }
 
-void CompareFrame::TakePicture(Pane& pane, ViewPicturePointer picture) {
+void CompareFrame::ShowPicture(Pane& pane, ViewPicturePointer picture) {
   LogEvent("compare", "pane=" + std::to_string(PaneOf(pane.canvas) + 1) + "/" + std::to_string(panes_.size()) +
                           " status=" + std::to_string(StatusNumber(picture->status)) + " file=" + pane.path);
   if (picture->picture != nullptr) shell_.Uses().Note({FileUse{pane.path, FileFunction::View}});
@@ -217,7 +217,7 @@ void CompareFrame::ShowFacts(const ViewCanvas* canvas) {
                                                         : SizeAndZoom(*shown->picture, canvas->Zoom());
   const wxString name = Shown(platform::FileNameOf(pane.path));
   pane.caption->SetLabel(name + "   " + Shown(facts));
-  TellScreenReader(*pane.canvas, name, Shown(facts));
+  ReportToScreenReader(*pane.canvas, name, Shown(facts));
 }
 
 // --- commands ---
@@ -282,7 +282,7 @@ void CompareFrame::OnKey(wxKeyEvent& event) {
 
 void CompareSelection(Shell& shell) {
   std::vector<std::string> files = shell.Tabs().SelectedFiles();
-  if (!CompareFrame::Takes(files.size())) return shell.Report("Two to four files can be compared.");
+  if (!CompareFrame::CanShow(files.size())) return shell.Report("Two to four files can be compared.");
   (new CompareFrame(shell, files))->Show();
 }
 

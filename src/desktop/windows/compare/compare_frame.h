@@ -19,7 +19,7 @@ class Shell;
 class CompareFrame : public wxFrame {
  public:
   // Whether so many files can be compared.
-  static constexpr bool Takes(size_t files) { return files >= 2 && files <= 4; }
+  static constexpr bool CanShow(size_t files) { return files >= 2 && files <= 4; }
 
   CompareFrame(Shell& shell, const std::vector<std::string>& files);
   ~CompareFrame() override;
@@ -50,7 +50,7 @@ class CompareFrame : public wxFrame {
   size_t PaneOf(const ViewCanvas* canvas) const;
   void WantPictures();
   void PicturesCame();
-  void TakePicture(Pane& pane, ViewPicturePointer picture);
+  void ShowPicture(Pane& pane, ViewPicturePointer picture);
   void Placed(const ViewCanvas* canvas);
   void Focused(size_t pane);
   void ShowFacts(const ViewCanvas* canvas);

@@ -78,10 +78,10 @@ void FileActions::Finished(const std::string& what, DeedResult result, const The
   const std::vector<DeedFailure> failures = result.failures;
   then(std::move(result));
   shell_.FilesChanged();
-  TellFailures(failures);
+  ReportFailures(failures);
 }
 
-void FileActions::TellFailures(const std::vector<DeedFailure>& failures) {
+void FileActions::ReportFailures(const std::vector<DeedFailure>& failures) {
   if (failures.empty()) return;
   wxString text;
   for (size_t i = 0; i < std::min(failures.size(), kMostFailuresShown); ++i) {

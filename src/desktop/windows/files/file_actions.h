@@ -65,7 +65,7 @@ class FileActions : public wxEvtHandler {
   void PastePicture(const std::string& folder);
   // Windows that show a renamed or moved folder go with it.
   void Follow(const FileDeed& deed, bool back);
-  void TellFailures(const std::vector<DeedFailure>& failures);
+  void ReportFailures(const std::vector<DeedFailure>& failures);
 
   Shell& shell_;
   UndoList undo_;

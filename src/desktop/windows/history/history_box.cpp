@@ -80,7 +80,7 @@ FileHistoryBox::FileHistoryBox(Shell& shell)
   Layout();
   AddColumns();
   shell_.Uses().Flush();
-  readable_ = history_.Take();
+  readable_ = history_.Read();
   Refill();
   SetEscapeId(wxID_CLOSE);
   CentreOnParent();
@@ -251,7 +251,7 @@ void FileHistoryBox::Options() {
   if (!ShowFileHistorySetup(this)) return;
   list_->SetWindowStyleFlag((list_->GetWindowStyleFlag() & ~wxDV_HORIZ_RULES) |
                             (settings.FileHistoryListRuleEnable != 0 ? wxDV_HORIZ_RULES : 0));
-  readable_ = history_.Take();
+  readable_ = history_.Read();
   Refill();
 }
 

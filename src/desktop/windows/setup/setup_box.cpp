@@ -42,7 +42,7 @@ bool MayChangeSettings(wxWindow& window) {
 }
 
 // Takes up what the controls hold and saves it. False after a message about the control that holds something else.
-bool TakeSettings(wxWindow& window, const BoundControls& controls, const std::function<void(uint32_t)>& show, bool& changed) {
+bool ReadSettings(wxWindow& window, const BoundControls& controls, const std::function<void(uint32_t)>& show, bool& changed) {
   const RegistryDestinations destinations;
   if (!MayChangeSettings(window)) return false;
   if (const auto fault = ReadSetupDialog(controls, destinations)) {
@@ -227,7 +227,7 @@ bool SetupBox::Apply() {
       if (&KeyOf(item.key) == row) ShowPage(item.page);
     }
   };
-  if (!TakeSettings(*this, controls_, show, changed)) return false;
+  if (!ReadSettings(*this, controls_, show, changed)) return false;
   if (TakeSetupChanged() || changed) applied_();
   LogEvent("setup", changed ? "applied changed=1" : "applied changed=0");
   return true;
@@ -302,7 +302,7 @@ bool ShowSettingsBox(wxWindow* parent, const wxString& title, const wxString& na
       wxEVT_BUTTON,
       [&](wxCommandEvent&) {
         bool changed = false;
-        if (TakeSettings(
+        if (ReadSettings(
                 dialog, controls, [](uint32_t) {}, changed))
           dialog.EndModal(wxID_OK);
       },

@@ -222,7 +222,7 @@ bool CanRun(const Command& command, Shell& shell) {
   const BrowserPage* browser = shell.Tabs().Front();
   switch (command.needs) {
     case Needs::Files: return browser != nullptr && browser->Model().HasFileForFunction();
-    case Needs::Few: return browser != nullptr && CompareFrame::Takes(browser->Model().Selected().SelectedCount());
+    case Needs::Few: return browser != nullptr && CompareFrame::CanShow(browser->Model().Selected().SelectedCount());
     case Needs::Item: return browser != nullptr && browser->Model().HasPathForFunction();
     case Needs::ClosedTab: return shell.Tabs().HasClosed();
     case Needs::Undo: return shell.Files().Undoable().CanUndo() && !shell.Files().Busy();

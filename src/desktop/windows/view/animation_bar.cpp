@@ -49,7 +49,7 @@ void AnimationBar::Open() {
   Show(line_->IsShown() || buttons_->IsShown());
 }
 
-void AnimationBar::Tell(bool playing, size_t frame, size_t count) {
+void AnimationBar::Report(bool playing, size_t frame, size_t count) {
   const int frames = static_cast<int>(std::max<size_t>(count, 1));
   if (line_->GetRange() != frames) line_->SetRange(frames);
   line_->SetValue(std::min(static_cast<int>(frame) + 1, frames));
@@ -58,7 +58,7 @@ void AnimationBar::Tell(bool playing, size_t frame, size_t count) {
   toggle_->SetBitmap(Symbol(playing ? "pause" : "play"));
   const wxString name = playing ? "Pause (Space)" : "Play (Space)";
   toggle_->SetToolTip(name);
-  TellScreenReader(*toggle_, name);
+  ReportToScreenReader(*toggle_, name);
 }
 
 }  // namespace fotomill::desktop

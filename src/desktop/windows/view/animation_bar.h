@@ -23,7 +23,7 @@ class AnimationBar : public wxPanel {
   // Shows what the settings want of it, if anything.
   void Open();
   void Close() { Show(false); }
-  void Tell(bool playing, size_t frame, size_t count);
+  void Report(bool playing, size_t frame, size_t count);
 
  private:
   wxBitmapButton* AddButton(wxSizer& row, const char* symbol, const wxString& name, std::function<void()> action);

@@ -45,7 +45,7 @@ void ViewAnimation::Begin(const ViewPicturePointer& picture) {
     });
   });
   if (SystemAnimates()) player_->Play();
-  bar_.Tell(player_->Playing(), 0, static_cast<size_t>(picture->picture->pageCount));
+  bar_.Report(player_->Playing(), 0, static_cast<size_t>(picture->picture->pageCount));
 }
 
 void ViewAnimation::HideBar(bool hide) {
@@ -103,7 +103,7 @@ void ViewAnimation::Tick() {
     timer_.StartOnce(std::max(static_cast<int>(std::ceil(left * 1000)), 1));
   }
   if (played && !player_->Playing()) canvas_.Sharpen();
-  bar_.Tell(player_->Playing(), player_->Frame(), player_->Count());
+  bar_.Report(player_->Playing(), player_->Frame(), player_->Count());
 }
 
 void ViewAnimation::ShowAgain() {

@@ -150,7 +150,7 @@ bool ViewFrame::AskForPicture() {
     WantPictures();
     ready = nullptr;
   }
-  if (ready != nullptr) TakePicture(ready);
+  if (ready != nullptr) ShowPicture(ready);
   return ready != nullptr;
 }
 
@@ -187,10 +187,10 @@ void ViewFrame::WantPictures() {
 
 void ViewFrame::PictureCame() {
   if (IsCurrent(loaded_)) return;
-  if (const ViewPicturePointer ready = loader_->Find(WishOf(place_))) TakePicture(ready);
+  if (const ViewPicturePointer ready = loader_->Find(WishOf(place_))) ShowPicture(ready);
 }
 
-void ViewFrame::TakePicture(ViewPicturePointer picture) {
+void ViewFrame::ShowPicture(ViewPicturePointer picture) {
   LogEvent("view", "place=" + std::to_string(place_ + 1) + "/" + std::to_string(list_.size()) +
                        " page=" + std::to_string(page_ + 1) + " status=" + std::to_string(StatusNumber(picture->status)) +
                        " ms=" + std::to_string(std::lround((platform::MonotonicSeconds() - keyTime_) * 1000)) +
@@ -286,7 +286,7 @@ void ViewFrame::ViewChanged() {
   if (title != GetTitle()) SetTitle(title);
   SetStatusText(Shown(line));
   // A number that changes many times a second is nothing to listen to.
-  if (!animation_->Playing()) TellScreenReader(*canvas_, name, Shown(line));
+  if (!animation_->Playing()) ReportToScreenReader(*canvas_, name, Shown(line));
   canvas_->SetOverlay(overlay_ ? OverlayLines() : std::vector<std::string>());
 }
 

@@ -58,7 +58,7 @@ class ViewFrame : public wxFrame {
   void WantPictures();
   void Resized();
   void PictureCame();
-  void TakePicture(ViewPicturePointer picture);
+  void ShowPicture(ViewPicturePointer picture);
   void ViewChanged();
   ViewWish WishOf(size_t place) const;
   bool IsCurrent(const ViewPicturePointer& picture) const;

@@ -78,7 +78,7 @@ void NameControl(wxWindow& window) {
   if (window.IsTopLevel() || dynamic_cast<wxStaticText*>(&window) != nullptr || dynamic_cast<wxToolBar*>(&window) != nullptr)
     return;
   const wxString name = NameOf(window);
-  if (!name.empty()) TellScreenReader(window, name);
+  if (!name.empty()) ReportToScreenReader(window, name);
 }
 
 // A window that has just come may still be being made, so that its name comes later: it is named when nothing else is to do.

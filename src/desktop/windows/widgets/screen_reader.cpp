@@ -19,7 +19,7 @@ class Gtk {
   }
   bool Here() const { return here_; }
 
-  void Tell(void* widget, const char* name, const char* description) const {
+  void SetTexts(void* widget, const char* name, const char* description) const {
     void* const object = accessible_(widget);
     if (object == nullptr) return;
     setName_(object, name);
@@ -34,7 +34,7 @@ class Gtk {
     }
     return parts;
   }
-  bool TakesFocus(void* widget) const { return canFocus_(widget) != 0; }
+  bool CanFocus(void* widget) const { return canFocus_(widget) != 0; }
 
  private:
   using Visit = void(void* part, void* data);
@@ -65,27 +65,27 @@ class Gtk {
   void (*setDescription_)(void*, const char*) = nullptr;
 };
 
-void TellParts(void* widget, const std::vector<void*>& windows, const wxScopedCharBuffer& name,
+void SetTextsOfParts(void* widget, const std::vector<void*>& windows, const wxScopedCharBuffer& name,
                const wxScopedCharBuffer& description) {
   const Gtk& gtk = Gtk::The();
   for (void* const part : gtk.PartsOf(widget)) {
     if (std::ranges::find(windows, part) != windows.end()) continue;
-    if (gtk.TakesFocus(part)) gtk.Tell(part, name.data(), description.data());
-    TellParts(part, windows, name, description);
+    if (gtk.CanFocus(part)) gtk.SetTexts(part, name.data(), description.data());
+    SetTextsOfParts(part, windows, name, description);
   }
 }
 
 }  // namespace
 
-void TellScreenReader(wxWindow& window, const wxString& name, const wxString& description) {
+void ReportToScreenReader(wxWindow& window, const wxString& name, const wxString& description) {
   window.SetName(name);
   void* const widget = window.GetHandle();
   if (widget == nullptr || !Gtk::The().Here()) return;
   const wxScopedCharBuffer nameText = name.utf8_str(), descriptionText = description.utf8_str();
   std::vector<void*> windows;
   for (const wxWindow* const child : window.GetChildren()) windows.push_back(child->GetHandle());
-  Gtk::The().Tell(widget, nameText.data(), descriptionText.data());
-  TellParts(widget, windows, nameText, descriptionText);
+  Gtk::The().SetTexts(widget, nameText.data(), descriptionText.data());
+  SetTextsOfParts(widget, windows, nameText, descriptionText);
 }
 
 }  // namespace fotomill::desktop
