@@ -65,6 +65,7 @@ struct CurvePoint {
 // A parameter's value. Which fields count depends on the kind.
 struct Value {
   bool given = false;            // it has a value: written down, or by default
+  bool byDefault = false;        // nobody wrote it down
   std::string text;              // as written; Text and File: the value
   double number = 0;             // Integer, Number, Percent (60 for 60 %), Angle
   int32_t choice = 0;            // Choice: its place in the row's list; Flag: 0 or 1

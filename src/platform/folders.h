@@ -19,6 +19,9 @@ std::string SpecialFolderPath(SpecialFolder folder);
 // Where fonts are kept, the user's own first; the folders may have folders in them, and need not be there.
 std::vector<std::string> FontFolders();
 
+// The user's full name as the system knows it, else the login name; empty when it knows neither.
+std::string UserFullName();
+
 // The running program's own file and its folder, links resolved.
 std::string ProgramPath();
 std::string ProgramFolder();

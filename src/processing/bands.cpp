@@ -2,21 +2,28 @@
 
 #include <algorithm>
 
+#include "core/workers/share_out.h"
+
 namespace fotomill {
 
 namespace {
 
-constexpr int32_t kBandsAThread = 4;  // so that Abort is seen in time and threads end together
+constexpr int32_t kBandsACore = 4;  // so that Abort is seen in time and cores finish together
 
 }  // namespace
 
 Status ForBands(int32_t rows, int32_t least, const Work& work, const BandFunction& band) {
-  const auto threads = static_cast<int32_t>(std::clamp<uint32_t>(work.threads, 1, 256));
-  const int32_t height = std::max({least, 1, rows / (threads * kBandsAThread)});
-  for (int32_t first = 0; first < rows; first += height) {
+  if (rows <= 0) return Status::Ok;
+  const auto cores = work.threads == 1 ? 1 : static_cast<int32_t>(std::min(WorkerPool::Shared().Cores(), 64u));
+  const int32_t height = std::clamp(std::max(least, rows / (cores * kBandsACore)), 1, rows);
+  const auto part = [&](int32_t number) {
     if (!work.GoesOn()) return Status::FunctionCancelled;
-    RETURN_IF_BAD(band(first, rows - first < height ? rows : first + height));
-  }
+    const int32_t first = number * height;
+    return band(first, std::min(rows - first, height) + first);
+  };
+  const int32_t parts = (rows - 1) / height + 1;
+  if (cores > 1 && parts > 1) return ShareOut(parts, part);
+  for (int32_t number = 0; number < parts; ++number) RETURN_IF_BAD(part(number));
   return Status::Ok;
 }
 

@@ -28,15 +28,22 @@ std::string FolderFromEnvironment(const char* name) {
   return value != nullptr && value[0] == '/' ? WithoutClosingSeparator(value) : std::string();
 }
 
+// The user's entry in the password database, or null. Its texts are in `buffer`.
+const passwd* PasswordEntry(passwd& entry, std::vector<char>& buffer) {
+  passwd* found = nullptr;
+  buffer.resize(4096);
+  while (getpwuid_r(getuid(), &entry, buffer.data(), buffer.size(), &found) == ERANGE && buffer.size() < (size_t{1} << 20)) {
+    buffer.resize(buffer.size() * 2);
+  }
+  return found;
+}
+
 std::string HomeFolder() {
   std::string home = FolderFromEnvironment("HOME");
   if (!home.empty()) return home;
   passwd entry;
-  passwd* found = nullptr;
-  std::vector<char> buffer(4096);
-  while (getpwuid_r(getuid(), &entry, buffer.data(), buffer.size(), &found) == ERANGE && buffer.size() < (size_t{1} << 20)) {
-    buffer.resize(buffer.size() * 2);
-  }
+  std::vector<char> buffer;
+  const passwd* const found = PasswordEntry(entry, buffer);
   return found != nullptr && found->pw_dir[0] == '/' ? WithoutClosingSeparator(found->pw_dir) : std::string();
 }
 
@@ -108,6 +115,25 @@ std::vector<std::string> FontFolders() {
   if (!home.empty()) folders.push_back(home + "/.fonts");
   folders.insert(folders.end(), {"/usr/local/share/fonts", "/usr/share/fonts"});
   return folders;
+}
+
+// The first field of the entry's comment is the full name, in which "&" stands for the login name.
+std::string UserFullName() {
+  passwd entry;
+  std::vector<char> buffer;
+  const passwd* const found = PasswordEntry(entry, buffer);
+  if (found == nullptr) return {};
+  const std::string login = found->pw_name;
+  const std::string_view comment = found->pw_gecos != nullptr ? found->pw_gecos : "";
+  std::string name;
+  for (const char c : comment.substr(0, comment.find(','))) {
+    if (c == '&') {
+      name += login;
+    } else {
+      name += c;
+    }
+  }
+  return name.empty() ? login : name;
 }
 
 std::string ProgramPath() {

@@ -294,7 +294,7 @@ class Resampling {
 constexpr int32_t kLeastRows = 32;  // of a band, so that little is computed twice
 
 Status ScaleInBands(const ResamplePlan& plan, const ScaleOptions& options, PackedImage& made, PackedImage& madeAlpha) {
-  ProgressSink* const progress = options.work.threads > 1 ? nullptr : options.progress;
+  ProgressSink* const progress = options.work.threads != 1 ? nullptr : options.progress;
   return ForBands(plan.size.height, kLeastRows, options.work, [&](int32_t first, int32_t end) {
     Resampling work;
     RETURN_IF_BAD(work.Open(plan, first));

@@ -63,7 +63,7 @@ struct ScaleOptions {
   bool linear = false;    // computes with light instead of sRGB values (IEC 61966-2-1)
   bool blocks = true;     // large reductions average blocks of pixels first; false: the filter sees every pixel
   Work work = {};
-  ProgressSink* progress = nullptr;  // told from one thread at a time; with `work.threads` above 1 not at all
+  ProgressSink* progress = nullptr;  // told when `work.threads` is 1
 };
 // The same in bands, as the options say. FunctionCancelled (4) when the work was stopped.
 Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Reach reach, Size size, const ScaleOptions& options,

@@ -1,0 +1,184 @@
+#include "operations/macros.h"
+
+#include <cstdio>
+#include <functional>
+#include <optional>
+
+#include "core/text.h"
+#include "metadata/exif/exif_walk.h"
+#include "platform/clock.h"
+#include "platform/folders.h"
+#include "platform/paths.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr std::string_view kLetters = "FNCYDTWHPE%";
+constexpr std::string_view kEarly = "FNC%";
+
+// The macro at the start of `text`, which begins with "%": its letter, its tag, and how long it is. nullopt when it is none.
+struct Macro {
+  char letter;
+  std::string_view tag;
+  size_t length;
+};
+std::optional<Macro> MacroAt(std::string_view text) {
+  if (text.size() < 2 || kLetters.find(text[1]) == std::string_view::npos) return std::nullopt;
+  if (text[1] != 'E') return Macro{text[1], {}, 2};
+  const size_t end = text.find('}');
+  if (text.size() < 3 || text[2] != '{' || end == std::string_view::npos || end == 3) return std::nullopt;
+  return Macro{'E', text.substr(3, end - 3), end + 1};
+}
+
+// Calls `other` for each piece of plain text, and `macro` for each macro with the text from it on.
+void Scan(std::string_view text, const std::function<void(std::string_view)>& other,
+          const std::function<size_t(std::string_view)>& macro) {
+  while (!text.empty()) {
+    const size_t percent = std::min(text.find('%'), text.size());
+    if (percent > 0) other(text.substr(0, percent));
+    text.remove_prefix(percent);
+    if (!text.empty()) text.remove_prefix(macro(text));
+  }
+}
+
+// The text of the first tag of a name. "Date taken" is found as "datetaken" and "date-taken" too.
+class TagFinder : public ExifSink {
+ public:
+  explicit TagFinder(std::string_view name) : name_(Plain(name)) {}
+  void Directory(int32_t, std::string_view) override {}
+  void Line(const ExifLine& line) override {
+    if (!found_ && Plain(line.name) == name_) found_ = std::string(line.text);
+  }
+  std::string Take() { return found_.value_or(std::string()); }
+
+ private:
+  static std::string Plain(std::string_view name) {
+    std::string plain;
+    for (const char c : name) {
+      if (c != ' ' && c != '-' && c != '_') plain += LowerCase(c);
+    }
+    return plain;
+  }
+  const std::string name_;
+  std::optional<std::string> found_;
+};
+
+// Finds when the picture was taken: DateTimeOriginal, else DateTimeDigitized, else DateTime.
+class DateFinder : public ExifSink {
+ public:
+  void Directory(int32_t, std::string_view) override {}
+  void Line(const ExifLine& line) override {
+    constexpr uint16_t kTags[] = {0x9003, 0x9004, 0x0132};
+    for (int rank = 0; rank < 3; ++rank) {
+      platform::LocalTime time;
+      if (line.value.tag == kTags[rank] && rank < rank_ && Read(line.text, time)) {
+        rank_ = rank;
+        time_ = time;
+      }
+    }
+  }
+  std::optional<platform::LocalTime> Time() const { return rank_ < 3 ? std::optional(time_) : std::nullopt; }
+
+ private:
+  static bool Read(std::string_view text, platform::LocalTime& time) {
+    const std::string copy(text);
+    const int fields = std::sscanf(copy.c_str(), "%4d%*1[:-]%2d%*1[:-]%2d %2d:%2d:%2d", &time.year, &time.month, &time.day,
+                                   &time.hour, &time.minute, &time.second);
+    return fields >= 3 && time.year > 0 && time.month >= 1 && time.month <= 12 && time.day >= 1 && time.day <= 31;
+  }
+  int rank_ = 3;
+  platform::LocalTime time_;
+};
+
+platform::LocalTime TimeOf(const MacroFacts& facts, const PictureRecord& picture) {
+  DateFinder finder;
+  (void)WalkExif(picture.metadata.exif, &finder);
+  const auto taken = finder.Time();
+  return taken ? *taken : platform::LocalTimeOf(facts.modified);
+}
+
+std::string TagText(std::string_view tag, const PictureRecord& picture) {
+  TagFinder finder(tag);
+  (void)WalkExif(picture.metadata.exif, &finder);
+  return finder.Take();
+}
+
+std::string Formatted(const char* format, int32_t a, int32_t b, int32_t c) {
+  char text[40];
+  std::snprintf(text, sizeof text, format, a, b, c);
+  return text;
+}
+
+std::string Expansion(const Macro& macro, const MacroFacts& facts, const PictureRecord& picture) {
+  const platform::LocalTime time =
+      macro.letter == 'Y' || macro.letter == 'D' || macro.letter == 'T' ? TimeOf(facts, picture) : platform::LocalTime{};
+  switch (macro.letter) {
+    case 'F': return std::string(platform::SplitPath(facts.fileName).base);
+    case 'N': return facts.copyrightHolder.empty() ? platform::UserFullName() : facts.copyrightHolder;
+    case 'C': return "\u00A9";
+    case 'Y': return std::to_string(time.year);
+    case 'D': return Formatted("%04d-%02d-%02d", time.year, time.month, time.day);
+    case 'T': return Formatted("%02d:%02d:%02d", time.hour, time.minute, time.second);
+    case 'W': return std::to_string(picture.image.Empty() ? picture.width : picture.image.Width());
+    case 'H': return std::to_string(picture.image.Empty() ? picture.height : picture.image.Height());
+    case 'P': return std::to_string(picture.page + 1);
+    case 'E': return TagText(macro.tag, picture);
+    default: return "%";
+  }
+}
+
+std::string Expand(std::string_view text, const MacroFacts& facts, const PictureRecord& picture,
+                   const std::function<std::string(std::string)>& safe) {
+  std::string expanded;
+  Scan(text, [&](std::string_view plain) { expanded += plain; },
+       [&](std::string_view rest) {
+         const auto macro = MacroAt(rest);
+         expanded += macro ? safe(Expansion(*macro, facts, picture)) : "%";
+         return macro ? macro->length : 1;
+       });
+  return expanded;
+}
+
+}  // namespace
+
+std::string ExpandMacros(std::string_view text, const MacroFacts& facts, const PictureRecord& picture) {
+  return Expand(text, facts, picture, [](std::string value) { return value; });
+}
+
+std::string ExpandNameMacros(std::string_view text, const MacroFacts& facts, const PictureRecord& picture) {
+  return Expand(text, facts, picture, [](std::string value) {
+    std::erase_if(value, [](char c) { return static_cast<uint8_t>(c) < 0x20 || c == 0x7f; });
+    for (char& c : value) {
+      if (c == '/' || c == '\\' || c == ':') c = '-';
+    }
+    return value;
+  });
+}
+
+std::string MacroProblem(std::string_view text) {
+  std::string problem;
+  Scan(text, [](std::string_view) {},
+       [&](std::string_view rest) -> size_t {
+         const auto macro = MacroAt(rest);
+         if (!macro && problem.empty()) {
+           problem = rest.starts_with("%E") ? "needs the name of a tag in %E{Tag}"
+                                            : "has an unknown macro " + std::string(rest.substr(0, 2)) + "; %% is a percent sign";
+         }
+         return macro ? macro->length : 1;
+       });
+  return problem;
+}
+
+bool IsKnownEarly(std::string_view text) {
+  bool early = true;
+  Scan(text, [](std::string_view) {},
+       [&](std::string_view rest) -> size_t {
+         const auto macro = MacroAt(rest);
+         early = early && macro && kEarly.find(macro->letter) != std::string_view::npos;
+         return macro ? macro->length : 1;
+       });
+  return early;
+}
+
+}  // namespace fotomill

@@ -1,0 +1,324 @@
+#include "operations/recipe.h"
+
+#include <algorithm>
+#include <charconv>
+#include <cstdio>
+
+#include "core/nearest_name.h"
+#include "core/plain_name.h"
+#include "core/text.h"
+#include "core/whole_number.h"
+#include "operations/macros.h"
+#include "operations/operations.h"
+#include "operations/recipe_words.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr uint64_t kMostRecipeBytes = 1 << 20;
+constexpr double kLongestText = 4096;
+constexpr std::string_view kOutputWord = "output", kSaveWord = "save";
+
+using enum ParameterKind;
+constexpr Parameter kSave[] = {
+    {.name = "to", .kind = kText, .preset = "", .least = 0, .most = 16, .label = "Format", .help = "Extension of the format to write."},
+    {.name = "dest", .kind = kFile, .preset = "", .label = "Folder",
+     .help = "Output folder, relative to the run's folder; created if needed."},
+    {.name = "name", .kind = kText, .preset = "", .least = 0, .most = kLongestText, .label = "Name",
+     .help = "Name of the file without extension; may have macros."},
+    {.name = "quality", .kind = kInteger, .preset = "", .least = 1, .most = 100, .label = "Quality",
+     .help = "Of formats with lossy compression."},
+    {.name = "max-bytes", .kind = kText, .preset = "", .least = 0, .most = 20, .label = "Most bytes",
+     .help = "The best quality whose file is at most this large, such as 200k."},
+};
+
+bool IsName(std::string_view text) {
+  return !text.empty() && std::ranges::all_of(text, [](char c) { return IsLetter(c) || (c >= '0' && c <= '9') || c == '-' || c == '_'; });
+}
+
+// A color key's number, 0x00BBGGRR, as recipes write it.
+std::string ColorText(std::string_view number) {
+  const auto value = ParseNumber<int32_t>(number);
+  if (!value) return {};
+  char text[8];
+  const auto color = static_cast<uint32_t>(*value);
+  std::snprintf(text, sizeof text, "#%02x%02x%02x", color & 0xff, color >> 8 & 0xff, color >> 16 & 0xff);
+  return text;
+}
+
+// What a key's value means as the text of a parameter; empty when it cannot.
+std::string KeyText(const Parameter& row, const KeyValues& keys) {
+  if (*row.key == '\0' || !keys) return {};
+  std::string text = keys(row.key);
+  if (row.kind == kColor) text = ColorText(text);
+  if (row.kind == kChoice && *row.keyWords != '\0') {
+    const auto number = ParseNumber<int32_t>(text);
+    text = number ? std::string(WordOf(row.keyWords, *number)) : std::string();
+  }
+  Value value;
+  return ReadValue(row, text, value).empty() ? text : std::string();
+}
+
+// What is wrong with a value beyond its kind.
+std::string ReadChecked(const Parameter& row, std::string_view text, Value& value) {
+  std::string wrong = ReadValue(row, text, value);
+  return wrong.empty() && row.kind == kText ? MacroProblem(text) : wrong;
+}
+
+// Gives every parameter without a value its default.
+void FillDefaults(Arguments& arguments, const KeyValues& keys) {
+  for (size_t i = 0; i < arguments.Rows().size(); ++i) {
+    Value& value = arguments.At(i);
+    if (value.given) continue;
+    const auto text = DefaultText(arguments.Rows()[i], keys);
+    if (!text || text->empty()) continue;
+    (void)ReadValue(arguments.Rows()[i], *text, value);
+    value.byDefault = true;
+  }
+}
+
+std::vector<std::string_view> ParameterNames(std::span<const Parameter> rows) {
+  std::vector<std::string_view> names;
+  for (const Parameter& row : rows) names.emplace_back(row.name);
+  return names;
+}
+
+std::string Sentence(std::string text) {
+  if (!text.empty() && text.back() != '.' && text.back() != '?') text += '.';
+  return text;
+}
+
+class Reader {
+ public:
+  explicit Reader(const KeyValues& keys) : keys_(keys) {}
+
+  std::vector<Mistake> Read(std::string_view text, Recipe& recipe) {
+    if (text.size() > kMostRecipeBytes) {
+      AddMistake(1, {}, {}, "The recipe is longer than a megabyte.");
+      return std::move(mistakes_);
+    }
+    const std::vector<RecipeLine> lines = SplitRecipe(text);
+    if (lines.empty()) AddMistake(1, {}, {}, "The recipe has no operations.");
+    for (const RecipeLine& line : lines) ReadLine(line);
+    if (recipe_.outputs.empty()) recipe_.outputs.push_back(std::move(unnamed_));
+    if (mistakes_.empty()) recipe = std::move(recipe_);
+    return std::move(mistakes_);
+  }
+
+ private:
+  void AddMistake(int32_t line, std::string operation, std::string parameter, std::string message) {
+    mistakes_.push_back({line, std::move(operation), std::move(parameter), Sentence(std::move(message))});
+  }
+
+  RecipeOutput& Current() { return recipe_.outputs.empty() ? unnamed_ : recipe_.outputs.back(); }
+
+  void ReadLine(const RecipeLine& line) {
+    const std::string& name = line.words[0].text;
+    if (line.open) return AddMistake(line.number, name, {}, "has a quote that does not end");
+    if (name == kOutputWord) return ReadOutput(line);
+    if (Current().hasSave) return AddMistake(line.number, name, {}, "follows \"save\", which ends an output");
+    if (name == kSaveWord) return ReadSave(line);
+    const Operation* const operation = FindOperation(name);
+    if (operation == nullptr) return RefuseName(line.number, name);
+    Step step{operation, Arguments(operation->parameters)};
+    if (!ReadArguments(line, step.arguments)) return;
+    if (operation->check != nullptr) {
+      if (const ArgumentProblem problem = operation->check(step.arguments); !problem.message.empty()) {
+        return AddMistake(line.number, name, problem.parameter, problem.message);
+      }
+    }
+    (recipe_.outputs.empty() ? recipe_.common : Current().steps).push_back(std::move(step));
+  }
+
+  void RefuseName(int32_t line, const std::string& name) {
+    std::vector<std::string_view> names{kOutputWord, kSaveWord};
+    for (const Operation* operation : Operations()) names.emplace_back(operation->name);
+    AddMistake(line, name, {}, "is not an operation." + NearestNameHint(name, names));
+  }
+
+  void ReadOutput(const RecipeLine& line) {
+    const std::string word(kOutputWord);
+    if (recipe_.outputs.empty() && unnamed_.hasSave) {
+      return AddMistake(line.number, word, {}, "follows \"save\"; with outputs, each has its own");
+    }
+    RecipeOutput output;
+    if (line.words.size() != 2) {
+      AddMistake(line.number, word, {}, "needs one name");
+    } else {
+      output.name = line.words[1].text;
+      if (output.name.empty() || output.name.size() > 64 || !IsPlainName(output.name)) {
+        AddMistake(line.number, word, "name", "must be a plain name, as it becomes part of file names");
+      }
+      if (std::ranges::any_of(recipe_.outputs, [&](const RecipeOutput& other) { return other.name == output.name; })) {
+        AddMistake(line.number, word, "name", "is taken by another output");
+      }
+    }
+    recipe_.outputs.push_back(std::move(output));
+  }
+
+  void ReadSave(const RecipeLine& line) {
+    Arguments arguments(kSave);
+    if (!ReadArguments(line, arguments)) return;
+    SaveStep save{.to = arguments.Text("to"),
+                  .folder = arguments.Text("dest"),
+                  .name = arguments.Text("name"),
+                  .quality = arguments.Integer("quality")};
+    const std::string word(kSaveWord);
+    if (arguments.Has("max-bytes")) {
+      const auto bytes = ReadByteCount(arguments.Text("max-bytes"));
+      if (!bytes) return AddMistake(line.number, word, "max-bytes", "must be a number of bytes such as 40000, 200k or 2M");
+      if (save.quality != 0) return AddMistake(line.number, word, "max-bytes", "cannot be combined with quality");
+      save.mostBytes = *bytes;
+    }
+    if (!IsPlainName(save.name)) return AddMistake(line.number, word, "name", "must be a plain name; dest names the folder");
+    Current().save = std::move(save);
+    Current().hasSave = true;
+  }
+
+  // Fills the arguments from the words behind the first. False after a mistake.
+  bool ReadArguments(const RecipeLine& line, Arguments& arguments) {
+    const size_t before = mistakes_.size();
+    size_t next = 0;
+    for (size_t i = 1; i < line.words.size(); ++i) ReadArgument(line, line.words[i], arguments, next);
+    FillDefaults(arguments, keys_);
+    for (size_t i = 0; i < arguments.Rows().size(); ++i) {
+      const Parameter& row = arguments.Rows()[i];
+      const bool missing = row.preset == nullptr && !arguments.At(i).given;
+      if (missing && mistakes_.size() == before) AddMistake(line.number, line.words[0].text, row.name, "must be given");
+    }
+    return mistakes_.size() == before;
+  }
+
+  void ReadArgument(const RecipeLine& line, const RecipeWord& word, Arguments& arguments, size_t& next) {
+    const std::string& operation = line.words[0].text;
+    const std::span<const Parameter> rows = arguments.Rows();
+    const auto indexOf = [&](std::string_view name) {
+      return static_cast<size_t>(std::ranges::find_if(rows, [&](const Parameter& row) { return row.name == name; }) - rows.begin());
+    };
+    const std::string_view text = word.text;
+    const bool named = word.equals != std::string::npos && IsName(text.substr(0, word.equals));
+    const std::string name(named ? text.substr(0, word.equals) : std::string_view());
+    size_t place = named ? indexOf(name) : indexOf(text);
+    std::string_view value = named ? text.substr(word.equals + 1) : text;
+    if (named && place == rows.size()) {
+      const auto names = ParameterNames(rows);
+      return AddMistake(line.number, operation, name, "is not a parameter of " + operation + "." + NearestNameHint(name, names));
+    }
+    const bool flag = !named && !word.quoted && place < rows.size() && rows[place].kind == kFlag;
+    if (flag) {
+      value = "yes";
+    } else if (!named) {
+      place = next++;
+      if (place >= rows.size()) return AddMistake(line.number, operation, word.text, "is more than the operation takes");
+    }
+    if (arguments.At(place).given) return AddMistake(line.number, operation, rows[place].name, "is given twice");
+    // An empty value is that of a parameter that is not set.
+    const bool unset = value.empty() && rows[place].preset != nullptr && *rows[place].preset == '\0';
+    if (unset) return;
+    if (const std::string wrong = ReadChecked(rows[place], value, arguments.At(place)); !wrong.empty()) {
+      AddMistake(line.number, operation, rows[place].name, wrong);
+      arguments.At(place).given = true;  // reported once
+    }
+  }
+
+  const KeyValues& keys_;
+  Recipe recipe_;
+  RecipeOutput unnamed_;
+  std::vector<Mistake> mistakes_;
+};
+
+void AppendNamed(std::string& line, std::string_view name, std::string_view value) {
+  line.append(" ").append(name).append("=").append(QuotedWord(value));
+}
+
+std::string PrintSave(const SaveStep& save) {
+  std::string line(kSaveWord);
+  if (!save.to.empty()) AppendNamed(line, "to", save.to);
+  if (!save.folder.empty()) AppendNamed(line, "dest", save.folder);
+  if (!save.name.empty()) AppendNamed(line, "name", save.name);
+  if (save.quality > 0) AppendNamed(line, "quality", std::to_string(save.quality));
+  if (save.mostBytes > 0) AppendNamed(line, "max-bytes", std::to_string(save.mostBytes));
+  return line;
+}
+
+}  // namespace
+
+const Operation* Recipe::First() const {
+  if (!common.empty()) return common.front().operation;
+  for (const RecipeOutput& output : outputs) {
+    if (!output.steps.empty()) return output.steps.front().operation;
+  }
+  return nullptr;
+}
+
+std::string Mistake::Text(bool withLine) const {
+  std::string text;
+  if (withLine) text.append("Line ").append(std::to_string(line)).append(": ");
+  if (!operation.empty() && parameter.empty()) text.append("\"").append(operation).append("\" ");
+  if (!parameter.empty()) text.append(operation).append(": \"").append(parameter).append("\" ");
+  return text.append(message);
+}
+
+std::vector<Mistake> ReadRecipe(std::string_view text, const KeyValues& keys, Recipe& recipe) { return Reader(keys).Read(text, recipe); }
+
+std::string PrintStep(const Step& step) {
+  std::string line = step.operation->name;
+  const std::span<const Parameter> rows = step.arguments.Rows();
+  for (size_t i = 0; i < rows.size(); ++i) {
+    const Value& value = step.arguments.At(i);
+    if (!value.given || value.byDefault) continue;
+    const bool bare = i == 0 && rows[i].kind != kFlag && rows[i].kind != kText;
+    if (bare) {
+      line.append(" ").append(QuotedWord(value.text));
+    } else {
+      AppendNamed(line, rows[i].name, value.text);
+    }
+  }
+  return line;
+}
+
+std::string PrintRecipe(const Recipe& recipe) {
+  std::string text;
+  for (const Step& step : recipe.common) text.append(PrintStep(step)).append("\n");
+  for (const RecipeOutput& output : recipe.outputs) {
+    const std::string indent = output.name.empty() ? "" : "  ";
+    if (!output.name.empty()) text.append("output ").append(QuotedWord(output.name)).append("\n");
+    for (const Step& step : output.steps) text.append(indent).append(PrintStep(step)).append("\n");
+    if (output.hasSave) text.append(indent).append(PrintSave(output.save)).append("\n");
+  }
+  return text;
+}
+
+Step DefaultStep(const Operation& operation, const KeyValues& keys) {
+  Step step{&operation, Arguments(operation.parameters)};
+  FillDefaults(step.arguments, keys);
+  return step;
+}
+
+std::string SetArgument(Step& step, std::string_view parameter, std::string_view text) {
+  const std::span<const Parameter> rows = step.arguments.Rows();
+  for (size_t i = 0; i < rows.size(); ++i) {
+    if (rows[i].name == parameter) return ReadChecked(rows[i], text, step.arguments.At(i));
+  }
+  return "is not a parameter of " + std::string(step.operation->name);
+}
+
+std::optional<std::string> DefaultText(const Parameter& row, const KeyValues& keys) {
+  if (std::string text = KeyText(row, keys); !text.empty()) return text;
+  return row.preset == nullptr ? std::nullopt : std::optional<std::string>(row.preset);
+}
+
+std::span<const Parameter> SaveParameters() { return kSave; }
+
+std::optional<uint64_t> ReadByteCount(std::string_view text) {
+  uint64_t number = 0;
+  const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
+  if (error != std::errc() || number == 0 || number > (uint64_t{1} << 40)) return std::nullopt;
+  text.remove_prefix(static_cast<size_t>(end - text.data()));
+  if (text.empty()) return number;
+  if (EqualIgnoringCase(text, "k")) return number << 10;
+  return EqualIgnoringCase(text, "m") ? std::optional(number << 20) : std::nullopt;
+}
+
+}  // namespace fotomill
