@@ -38,7 +38,8 @@ bool IsFileName(std::string_view name) { return !name.empty() && name != "." && 
 
 // Asks until the name can be taken or nobody wants one. The extension stays the format's, cased after the source's.
 bool AskName(Destination& destination, const std::string& source, std::string_view title, BatchJob& job) {
-  const std::string extension = CasedExtension(ExtensionOfFormat(job), platform::ExtensionOf(source), job.naming.extensionCase);
+  const std::string_view format = destination.extension.empty() ? ExtensionOfFormat(job) : std::string_view(destination.extension);
+  const std::string extension = CasedExtension(format, platform::ExtensionOf(source), job.naming.extensionCase);
   NameQuestion question{std::string(title), source, destination.path, extension, {}};
   const platform::PathParts planned = platform::SplitPath(destination.path);
   const std::string folder = std::string(planned.drive).append(planned.folder);
@@ -148,18 +149,28 @@ std::string_view ExtensionOfFormat(const BatchJob& job) {
 }
 
 std::string PlannedDestination(const std::string& source, std::string_view below, std::string_view prefix, const BatchJob& job) {
+  const std::string base = std::string(prefix).append(platform::SplitPath(source).base);
+  return PlannedDestination(source, {.extension = ExtensionOfFormat(job), .below = below, .subfolder = {}, .base = base}, job);
+}
+
+std::string PlannedDestination(const std::string& source, const OutputPlace& place, const BatchJob& job) {
   const platform::PathParts parts = platform::SplitPath(source);
-  std::string name(prefix);
-  name.append(parts.base).append(1, '.');
-  name += CasedExtension(ExtensionOfFormat(job), platform::ExtensionOf(source), job.naming.extensionCase);
-  if (job.naming.beside || job.destinationFolder.empty()) return platform::JoinPath({parts.drive, parts.folder, name, {}});
-  if (below.empty()) return platform::JoinFolder(job.destinationFolder, name);
-  return platform::JoinFolder(platform::JoinFolder(job.destinationFolder, below), name);
+  std::string name(place.base);
+  name += '.';
+  name += CasedExtension(place.extension, platform::ExtensionOf(source), job.naming.extensionCase);
+  const bool beside = job.naming.beside || job.destinationFolder.empty();
+  if (beside && place.subfolder.empty()) return platform::JoinPath({parts.drive, parts.folder, name, {}});
+  std::string folder = beside ? std::string(parts.drive).append(parts.folder) : job.destinationFolder;
+  for (const std::string_view part : {beside ? std::string_view() : place.below, place.subfolder}) {
+    const bool absolute = part.starts_with(platform::kSeparator) || !platform::SplitPath(part).drive.empty();
+    if (!part.empty()) folder = absolute ? std::string(part) : folder.empty() ? std::string(part) : platform::JoinFolder(folder, part);
+  }
+  return platform::JoinFolder(folder, name);
 }
 
 bool IsDestinationWanted(const BatchJob& job, bool intoFolder) {
   if (job.prompts == nullptr) return true;
-  if (job.naming.confirmFormat) {
+  if (job.naming.confirmFormat && !ExtensionOfFormat(job).empty()) {
     const std::string format = UpperCase(ExtensionOfFormat(job));
     if (!job.prompts->ConfirmFormat("Write files to the " + format + " format?")) return false;
   }
@@ -201,7 +212,7 @@ DestinationAnswer SettleUnasked(Destination& destination, const OverwritePolicy&
 
 DestinationAnswer MakeDestinationName(Destination& destination, const std::string& source, std::string_view title, BatchJob& job,
                                       const TakenTest& taken, const VariantMaker& variant, const PictureRecord* picture) {
-  const FormatEntry& row = FormatRow(job.formatIndex);
+  const FormatEntry& row = FormatRow(destination.formatIndex == kNoFormat ? job.formatIndex : destination.formatIndex);
   if ((row.flags & FMT_CLIPBOARD) != 0) {
     destination.path = kClipboardName;
     return DestinationAnswer::Write;

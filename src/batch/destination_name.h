@@ -27,6 +27,15 @@ std::string_view ExtensionOfFormat(const BatchJob& job);
 // (the source's own folder where there is none, or where the rules say so), prefix, base name, dot and extension.
 std::string PlannedDestination(const std::string& source, std::string_view below, std::string_view prefix, const BatchJob& job);
 
+// The same for one of several outputs of a source.
+struct OutputPlace {
+  std::string_view extension;  // as the format has it
+  std::string_view below;      // folder beneath the job's destination folder, or beneath the source's where it has none
+  std::string_view subfolder;  // and beneath that one
+  std::string_view base;       // name without extension
+};
+std::string PlannedDestination(const std::string& source, const OutputPlace& place, const BatchJob& job);
+
 // A destination without drive and folder, put into the job's destination folder; others stay. nullopt when that gives 261
 // characters or more.
 std::optional<std::string> CompletedDestination(const std::string& destination, std::string_view folder);
@@ -48,6 +57,8 @@ struct Destination {
   bool elsewhere = false;  // the user chose another folder for it, which is not made
   bool taken = false;      // the name was not free
   bool noVariant = false;  // skipped because no numbered variant is free
+  int32_t formatIndex = kNoFormat;  // of the output; none: the job's
+  std::string extension;            // of the output, as the format has it; empty: the job's
 };
 
 // The "path" of outputs that go to the clipboard, and the hint of a file for which no numbered

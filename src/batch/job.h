@@ -92,6 +92,7 @@ struct FileOutcome {
   std::string hint = {};  // a sentence that goes behind the message; empty when there is nothing to add
   bool skipped = false;   // left out by choice or for want of a name; not a failure
   bool replaced = false;  // the output took the place of a file
+  std::string output = {};  // which of several outputs of its source, by name
   std::string note = {};  // a remark that is no failure; empty when there is none
 };
 

@@ -1,5 +1,6 @@
 #include "batch/reported_run.h"
 
+#include <algorithm>
 #include <utility>
 
 #include "batch/abort.h"
@@ -24,20 +25,26 @@ uint32_t ReportedRun::CoreJobs() { return platform::CoreCount(); }
 
 Status ReportedRun::Work(size_t file) {
   const FolderScope folder(files_[file].name);
-  if (auto outcome = way_.process(file)) outcomes_[file] = std::make_unique<FileOutcome>(std::move(*outcome));
+  outcomes_[file] = way_.process(file);
   return Status::Ok;
 }
 
 void ReportedRun::Deliver(size_t file, Status status) {
-  std::unique_ptr<FileOutcome> outcome = std::move(outcomes_[file]);
-  if (status != Status::Ok) outcome = std::make_unique<FileOutcome>(FileOutcome{.source = files_[file].name, .status = status});
-  if (outcome == nullptr) return;
-  job_.source.AssignCut(outcome->source);
-  const bool written = !outcome->destination.empty() && !outcome->skipped && !way_.dryRun;
-  if (written) NoteUse(outcome->source);
-  job_.filesChanged = job_.filesChanged || written;
-  if (outcome->skipped && outcome->status != Status::Ok) ++job_.writeAborts;
-  ReportOutcome(job_, *outcome, static_cast<uint32_t>(file), static_cast<uint32_t>(files_.size()));
+  std::vector<FileOutcome> outcomes = std::move(outcomes_[file]);
+  if (status != Status::Ok) outcomes = {FileOutcome{.source = files_[file].name, .status = status}};
+  if (outcomes.empty()) return;
+  job_.source.AssignCut(outcomes[0].source);
+  const auto isWritten = [&](const FileOutcome& outcome) { return !outcome.destination.empty() && !outcome.skipped && !way_.dryRun; };
+  if (std::ranges::any_of(outcomes, isWritten)) {
+    NoteUse(outcomes[0].source);
+    job_.filesChanged = true;
+  }
+  for (const FileOutcome& outcome : outcomes) Report(file, outcome);
+}
+
+void ReportedRun::Report(size_t file, const FileOutcome& outcome) {
+  if (outcome.skipped && outcome.status != Status::Ok) ++job_.writeAborts;
+  ReportOutcome(job_, outcome, static_cast<uint32_t>(file), static_cast<uint32_t>(files_.size()));
   if (job_.box != nullptr && !job_.box->GoesOn()) ended_ = true;
 }
 

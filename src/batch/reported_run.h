@@ -21,8 +21,8 @@ class ReportedRun {
  public:
   // What is done with each file, and how it is recorded.
   struct Way {
-    // On any thread. nullopt for a file that was given up by Abort.
-    std::function<std::optional<FileOutcome>(size_t file)> process;
+    // On any thread: an outcome for each output of the file. None for a file that was given up by Abort.
+    std::function<std::vector<FileOutcome>(size_t file)> process;
     FileFunction history = FileFunction::Convert;
     bool dryRun = false;
   };
@@ -38,13 +38,14 @@ class ReportedRun {
   static uint32_t CoreJobs();
   Status Work(size_t file);
   void Deliver(size_t file, Status status);
+  void Report(size_t file, const FileOutcome& outcome);
   void Tick();
   void NoteUse(const std::string& source);
 
   const std::span<const BatchFile> files_;
   BatchJob& job_;
   const Way way_;
-  std::vector<std::unique_ptr<FileOutcome>> outcomes_;  // of files that are done and not yet reported; null: given up
+  std::vector<std::vector<FileOutcome>> outcomes_;  // of files that are done and not yet reported; none: given up
   std::atomic<bool> ended_{false};
   OrderedRun run_;
 };

@@ -10,10 +10,13 @@
 #include "batch/prompts.h"
 #include "batch/reported_run.h"
 #include "batch/run_names.h"
+#include "core/plain_name.h"
 #include "core/text.h"
 #include "metadata/exif/picture_exif.h"
+#include "operations/engine.h"
 #include "platform/files.h"
 #include "platform/paths.h"
+#include "platform/temporary_file.h"
 #include "platform/volumes.h"
 #include "processing/palette/reduce.h"
 #include "registry/registry.h"
@@ -23,6 +26,7 @@ namespace fotomill {
 namespace {
 
 constexpr int kMostLostRaces = 100;
+constexpr const char* kNoName = "Its name would be empty or lead to another folder.";
 constexpr const char* kTooLong = "Its path would be longer than 260 characters.";
 
 std::string FolderOf(const std::string& path) {
@@ -32,6 +36,7 @@ std::string FolderOf(const std::string& path) {
 
 // Whether names are settled by more than a look at the folder.
 bool AsksEveryName(const BatchJob& job) {
+  if (job.formatIndex == kNoFormat) return job.prompts != nullptr && (job.naming.askName || job.naming.askPassword);
   const FormatEntry& row = FormatRow(job.formatIndex);
   if ((row.flags & FMT_CLIPBOARD) != 0) return true;
   return job.prompts != nullptr && (job.naming.askName || (job.naming.askPassword && row.takesPassword));
@@ -49,10 +54,17 @@ class Batch {
         job_(job),
         prefix_(function.prefix ? *function.prefix : std::string(job.naming.PrefixOf(function.history))),
         asksEveryName_(AsksEveryName(job)),
+        outputs_(function.outputs),
+        needsPicture_(std::ranges::any_of(outputs_, &BatchOutput::nameNeedsPicture)),
         run_(files, job,
              {.process = [this](size_t i) { return Process(i); }, .history = function.history, .dryRun = function.dryRun}) {
+    if (outputs_.empty()) outputs_.emplace_back();
     for (const BatchFile& file : files_) {
-      if (file.status == Status::Ok) names_.AddSource(file.name, Planned(file));
+      if (file.status != Status::Ok) continue;
+      names_.AddSource(file.name);
+      for (const OutputTarget& target : TargetsOf(file)) {
+        if (!target.path.empty()) names_.AddPlanned(target.path);
+      }
     }
     TakeRules();
   }
@@ -69,31 +81,104 @@ class Batch {
 
   void TakeRules() { rules_ = {job_.overwrite, job_.applyToRest, AsksAboutCollisions(job_)}; }
 
-  std::string Planned(const BatchFile& file) const {
-    if (!function_.out.empty()) return function_.out;
-    return PlannedDestination(file.name, function_.keepTree ? file.below : std::string(), prefix_, job_);
+  std::vector<OutputTarget> TargetsOf(const BatchFile& file) const {
+    std::vector<OutputTarget> targets;
+    for (const BatchOutput& output : outputs_) {
+      OutputTarget& target = targets.emplace_back(TargetOf(file.name, output, job_, function_.fallback));
+      if (!output.nameNeedsPicture) target.path = PathOf(file, target, nullptr);
+    }
+    return targets;
   }
 
-  // On any thread: one file from its source to its output. nullopt where it was given up by Abort before it had a name.
-  std::optional<FileOutcome> Process(size_t i) {
+  // Where an output goes; empty when its name comes out empty.
+  std::string PathOf(const BatchFile& file, const OutputTarget& target, const PictureRecord* picture) const {
+    if (!function_.out.empty()) return function_.out;
+    const BatchOutput& output = *target.output;
+    std::string base;
+    if (output.name) {
+      base = function_.prefix.value_or(std::string()) + output.name(file.name, picture);
+      if (!IsPlainName(base) || base.empty()) return {};
+    } else {
+      base = prefix_ + std::string(platform::SplitPath(file.name).base);
+      if (!output.label.empty()) base.append("-").append(output.label);
+    }
+    const std::string_view below = function_.keepTree ? std::string_view(file.below) : std::string_view();
+    return PlannedDestination(file.name, {target.extension, below, output.folder, base}, job_);
+  }
+
+  // On any thread: one file from its source to its outputs. None where it was given up by Abort before it had a name.
+  std::vector<FileOutcome> Process(size_t i) {
     const BatchFile& file = files_[i];
-    if (file.status != Status::Ok) return Failure(file, file.status, file.hint);
-    Destination destination;
-    destination.path = Planned(file);
-    if (destination.path.size() > PathText::Capacity()) return Failure(file, Status::InvalidDestination, kTooLong);
+    if (file.status != Status::Ok) return {Failure(file, file.status, file.hint)};
+    std::vector<OutputTarget> targets = TargetsOf(file);
+    std::vector<std::string> planned;
+    for (const OutputTarget& target : targets) planned.push_back(target.path);
     // Where another file's output may take this source's place, the order of the selection says which comes first.
-    if (names_.IsOutputOfOthers(file.name, destination.path) && !run_.InTurn(i, [] {})) return std::nullopt;
-    if (IsLeftOut(i, destination)) return Skipped(file, destination);
+    if (names_.IsOutputOfOthers(file.name, planned) && !run_.InTurn(i, [] {})) return {};
+    std::vector<FileOutcome> outcomes(targets.size());
+    std::vector<size_t> open;  // outputs that need the picture
+    for (size_t k = 0; k < targets.size(); ++k) {
+      if (!IsSettledEarly(i, targets[k], outcomes[k])) open.push_back(k);
+    }
+    if (open.empty()) return outcomes;
     PicturePointer picture;
     if (const Status status = Load(file.name, picture); status != Status::Ok) {
-      return Failure(file, status, LoadHint(file.name, status, picture.get()));
+      return {Failure(file, status, LoadHint(file.name, status, picture.get()))};
     }
+    if (function_.transform && !IsOnlyPlanned()) {
+      if (const Status status = function_.transform(*picture); status != Status::Ok) return {Failure(file, status)};
+    }
+    for (const size_t k : open) {
+      auto outcome = Produce(i, targets[k], picture, k == open.back());
+      if (!outcome) return {};
+      outcomes[k] = std::move(*outcome);
+      outcomes[k].output = targets[k].output->label;
+    }
+    return outcomes;
+  }
+
+  // Whether a dry run can do without the pictures.
+  bool IsOnlyPlanned() const { return function_.dryRun && !needsPicture_; }
+
+  // Whether it is known without the picture what becomes of an output; tells it then.
+  bool IsSettledEarly(size_t i, const OutputTarget& target, FileOutcome& outcome) {
+    const BatchFile& file = files_[i];
+    outcome.output = target.output->label;
+    if (target.output->nameNeedsPicture) return false;
+    Destination destination;
+    destination.path = target.path;
+    if (target.path.empty() || target.path.size() > PathText::Capacity()) {
+      outcome = Failure(file, Status::InvalidDestination, target.path.empty() ? kNoName : kTooLong);
+    } else if (IsLeftOut(i, destination)) {
+      outcome = Skipped(file, destination);
+    } else {
+      return false;
+    }
+    outcome.output = target.output->label;
+    return true;
+  }
+
+  // Makes one output of a picture that has gone through the function's own work. All but the last one get a copy.
+  std::optional<FileOutcome> Produce(size_t i, const OutputTarget& target, PicturePointer& picture, bool last) {
+    const BatchFile& file = files_[i];
+    PicturePointer copy;
+    if (!last && !IsOnlyPlanned()) {
+      copy = NewPictureRecord(picture->window, picture->context);
+      const Status status = copy != nullptr ? CopyPicture(*picture, *copy) : Status::MemoryAllocationError;
+      if (status != Status::Ok) return Failure(file, status);
+    }
+    PictureRecord& own = copy != nullptr ? *copy : *picture;
     // The source may have bound its own plug-in format to the row that the destination's had.
-    if (job_.formatIndex == kSpareRow) (void)FindPluginFormat("x." + job_.extension);
-    if (const Status status = Change(*picture); status != Status::Ok) {
+    if (target.formatIndex == kSpareRow) (void)FindPluginFormat("x." + target.extension);
+    if (const Status status = Change(own, target); status != Status::Ok) {
       return Failure(file, status, status == Status::TooManyColors ? function_.reduceHint : std::string());
     }
-    return WriteUnderFreeName(i, std::move(destination), *picture);
+    Destination destination;
+    destination.path = target.output->nameNeedsPicture ? PathOf(file, target, &own) : target.path;
+    destination.formatIndex = target.formatIndex;
+    destination.extension = target.extension;
+    if (destination.path.empty()) return Failure(file, Status::InvalidDestination, kNoName);
+    return WriteUnderFreeName(i, std::move(destination), own, target);
   }
 
   static FileOutcome Skipped(const BatchFile& file, const Destination& destination) {
@@ -123,7 +208,7 @@ class Batch {
   Status Load(const std::string& name, PicturePointer& picture) const {
     RETURN_IF_BAD(LoadPictureInfo(name.c_str(), picture));
     picture->page = function_.page - 1;
-    if (function_.dryRun) return function_.page > picture->pageCount ? Status::NoImages : Status::Ok;
+    if (IsOnlyPlanned()) return function_.page > picture->pageCount ? Status::NoImages : Status::Ok;
     RETURN_IF_BAD(ReadPicture(*picture));
     return function_.autoOrient ? TurnUpright(*picture) : Status::Ok;
   }
@@ -136,16 +221,18 @@ class Batch {
   }
 
   // The function's own work, then the depth that the format takes.
-  Status Change(PictureRecord& picture) const {
-    if (function_.transform && !function_.dryRun) RETURN_IF_BAD(function_.transform(picture));
-    const auto deepest = static_cast<int32_t>(FormatRow(job_.formatIndex).maxBits);
+  Status Change(PictureRecord& picture, const OutputTarget& target) const {
+    if (target.output->transform && !IsOnlyPlanned()) RETURN_IF_BAD(target.output->transform(picture));
+    const auto deepest = static_cast<int32_t>(FormatRow(target.formatIndex).maxBits);
     if (picture.bitsPerPixel <= deepest) return Status::Ok;
-    if (!function_.reduce) return Status::TooManyColors;
-    return function_.dryRun ? Status::Ok : ReduceColors(picture, deepest, job_.reduction);
+    if (!Reduces(target)) return Status::TooManyColors;
+    return IsOnlyPlanned() ? Status::Ok : ReduceColors(picture, deepest, job_.reduction);
   }
 
+  bool Reduces(const OutputTarget& target) const { return function_.reduce || target.kept; }
+
   // Settles the name and writes, again when someone else has taken the name since it was found free.
-  std::optional<FileOutcome> WriteUnderFreeName(size_t i, Destination planned, PictureRecord& picture) {
+  std::optional<FileOutcome> WriteUnderFreeName(size_t i, Destination planned, PictureRecord& picture, const OutputTarget& target) {
     const BatchFile& file = files_[i];
     for (int attempt = 0; attempt < kMostLostRaces; ++attempt) {
       Destination destination = planned;
@@ -158,12 +245,13 @@ class Batch {
         return Failure(file, Status::InvalidDestination, kTooLong);
       }
       const bool replaces = destination.replace && platform::FileExists(destination.path);
-      const Status status = function_.dryRun ? Status::Ok : Write(picture, destination);
+      std::string hint;
+      const Status status = function_.dryRun ? Status::Ok : Write(picture, destination, target, hint);
       if (status == Status::Ok) return Written(file, destination, replaces, picture);
       GiveBack(destination.path);
       const bool lostRace =
           status == Status::ErrorCreatingFile && !destination.replace && platform::IsRegularFile(destination.path);
-      if (!lostRace) return Failure(file, status, WriteHint(destination, status, picture));
+      if (!lostRace) return Failure(file, status, hint.empty() ? WriteHint(destination, status, picture, target) : hint);
     }
     return Failure(file, Status::ErrorCreatingFile, std::string(kWriteAborted));
   }
@@ -249,27 +337,51 @@ class Batch {
   }
 
   // Codecs may take less than their row says; colors are then reduced further, step by step.
-  Status Write(PictureRecord& picture, const Destination& destination) const {
-    const bool there = job_.naming.beside || job_.destinationFolder.empty() || !function_.out.empty() || destination.elsewhere;
+  Status Write(PictureRecord& picture, const Destination& destination, const OutputTarget& target, std::string& hint) const {
+    const bool beside = (job_.naming.beside || job_.destinationFolder.empty()) && target.output->folder.empty();
+    const bool there = beside || !function_.out.empty() || destination.elsewhere;
     if (!there && !platform::MakeFolders(FolderOf(destination.path))) return Status::ErrorCreatingFile;
     WriteOptions write;
     write.existing = destination.replace ? platform::Existing::Replace : platform::Existing::Refuse;
     write.keepMetadata = function_.keepMetadata;
     write.comment = job_.writeComments;
     write.password = destination.password;
+    write.quality = target.output->quality;
     if (destination.recycle) {
       write.makeWay = [&] { return !platform::FileExists(destination.path) || platform::MoveToTrash(destination.path); };
     }
     const PathText source = picture.fileName;
     RefreshExif(picture);
-    Status status = WritePictureAs(picture, destination.path, job_.formatIndex, write);
+    if (target.output->mostBytes > 0) RETURN_IF_BAD(ChooseQuality(picture, target, write, hint));
+    Status status = WritePictureAs(picture, destination.path, target.formatIndex, write);
     for (const int32_t bits : {8, 4, 1}) {
-      if (status != Status::TooManyColors || !function_.reduce) break;
+      if (status != Status::TooManyColors || !Reduces(target)) break;
       if (picture.bitsPerPixel <= bits) continue;
       RETURN_IF_BAD(ReduceColors(picture, bits, job_.reduction));
-      status = WritePictureAs(picture, destination.path, job_.formatIndex, write);
+      status = WritePictureAs(picture, destination.path, target.formatIndex, write);
     }
     picture.fileName = source;
+    return status;
+  }
+
+  // The best quality whose file is small enough, found by writing temporary files.
+  static Status ChooseQuality(PictureRecord& picture, const OutputTarget& target, WriteOptions& write, std::string& hint) {
+    const PathText source = picture.fileName;
+    uint64_t smallest = 0;
+    const auto trial = [&](int32_t quality, uint64_t& bytes) {
+      platform::TemporaryFile file;
+      if (!file.Create("." + target.extension)) return Status::ErrorCreatingFile;
+      WriteOptions attempt = write;
+      attempt.existing = platform::Existing::Replace;
+      attempt.makeWay = {};
+      attempt.quality = quality;
+      const Status status = WritePictureAs(picture, file.Path(), target.formatIndex, attempt);
+      bytes = platform::FactsOf(file.Path()).size;
+      return status;
+    };
+    const Status status = FindQuality(target.output->mostBytes, trial, write.quality, smallest);
+    picture.fileName = source;
+    if (status == Status::UnsuitableImage) hint = "At the lowest quality it has " + WithThousands(smallest) + " bytes.";
     return status;
   }
 
@@ -279,22 +391,22 @@ class Batch {
       outcome.destination = destination.path;
       return outcome;
     }
-    return {.source = file.name, .destination = destination.path, .replaced = replaces, .note = LostMetadata(picture)};
+    return {.source = file.name, .destination = destination.path, .replaced = replaces, .note = LostMetadata(picture, destination)};
   }
 
   // Metadata that the format cannot hold are not lost in silence, for who wants to know.
-  std::string LostMetadata(const PictureRecord& picture) const {
+  std::string LostMetadata(const PictureRecord& picture, const Destination& destination) const {
     const PictureMetadata& metadata = picture.metadata;
     std::string lost;
     if (!metadata.exif.empty() && (picture.lostMetadata & kLostExif) != 0) lost += ", EXIF";
     if (!metadata.xmp.empty() && (picture.lostMetadata & kLostXmp) != 0) lost += ", XMP";
     if (!metadata.icc.empty() && (picture.lostMetadata & kLostIcc) != 0) lost += ", color profile";
     if (!function_.keepMetadata || lost.empty()) return {};
-    return UpperCase(job_.extension) + " cannot hold its " + lost.substr(2) + ".";
+    return UpperCase(destination.extension) + " cannot hold its " + lost.substr(2) + ".";
   }
 
-  std::string WriteHint(const Destination& destination, Status status, const PictureRecord& picture) const {
-    if (status == Status::TooManyColors) return function_.reduce ? std::string() : function_.reduceHint;
+  std::string WriteHint(const Destination& destination, Status status, const PictureRecord& picture, const OutputTarget& target) const {
+    if (status == Status::TooManyColors) return Reduces(target) ? std::string() : function_.reduceHint;
     const std::string& path = destination.path;
     const std::string folder = FolderOf(path);
     const bool full = status == Status::ErrorWritingFile && platform::FreeSpace(folder) < picture.image.Bytes().size();
@@ -311,6 +423,8 @@ class Batch {
   BatchJob& job_;
   const std::string prefix_;
   const bool asksEveryName_;
+  std::vector<BatchOutput> outputs_;
+  const bool needsPicture_;  // a name of an output has macros about the picture
   mutable std::mutex mutex_;  // over what follows
   RunNames names_;
   Rules rules_;

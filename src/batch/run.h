@@ -5,8 +5,10 @@
 #include <optional>
 #include <span>
 #include <string>
+#include <vector>
 
 #include "batch/job.h"
+#include "batch/output_target.h"
 
 namespace fotomill {
 
@@ -22,12 +24,16 @@ struct BatchFile {
 struct BatchFunction {
   // Works on the decoded picture; empty when it is only converted. Called on several threads at once, on a picture each.
   std::function<Status(PictureRecord& picture)> transform = {};
+  std::vector<BatchOutput> outputs = {};         // each file is decoded once for all of them; none: one, as the job says
+  FallbackFormat fallback = {};                  // for jobs without a format: of sources whose own cannot be written
   FileFunction history = FileFunction::Convert;  // under which the sources go into the file history
-  std::optional<std::string> prefix = {};        // in front of every name: at most 32 characters, a plain name; none: the job's
+  std::optional<std::string> prefix = {};        // in front of every name: at most 32 characters, a plain name; none: the job's,
+                                                 // but nothing in front of names that an output makes itself
   std::string out = {};                          // not empty: the whole path of the output of a selection of one
   int32_t page = 1;                              // of files with several, from 1
   uint32_t jobs = 0;                             // pictures in work at a time; 0: one a core
-  bool reduce = false;                           // colors of pictures that are too deep for the format are reduced
+  bool reduce = false;                           // colors of pictures that are too deep for the format are reduced, as
+                                                 // they always are for a format that was kept
   std::string reduceHint = {};                   // goes behind "Too many colors." where they are not
   bool autoOrient = false;                       // pictures are turned upright as their EXIF says
   bool keepMetadata = true;                      // EXIF, XMP and color profiles go along

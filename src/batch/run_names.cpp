@@ -24,10 +24,9 @@ std::string OriginOfVariant(const std::string& path) {
 
 RunNames::RunNames() : folder_(platform::CurrentFolder()) {}
 
-void RunNames::AddSource(const std::string& source, const std::string& planned) {
-  ++sources_[Key(source)];
-  ++planned_[Key(planned)];
-}
+void RunNames::AddSource(const std::string& source) { ++sources_[Key(source)]; }
+
+void RunNames::AddPlanned(const std::string& planned) { ++planned_[Key(planned)]; }
 
 bool RunNames::ConcernsNobodyElse(const std::string& source, const std::string& planned) const {
   const std::string own = Key(source), path = Key(planned), origin = OriginOfVariant(path);
@@ -42,10 +41,11 @@ bool RunNames::IsExpected(const std::string& path) const {
   return planned_.contains(key) || sources_.contains(key);
 }
 
-bool RunNames::IsOutputOfOthers(const std::string& source, const std::string& planned) const {
+bool RunNames::IsOutputOfOthers(const std::string& source, std::span<const std::string> planned) const {
   const std::string own = Key(source);
   const auto found = planned_.find(own);
-  return found != planned_.end() && (found->second > 1 || own != Key(planned));
+  if (found == planned_.end()) return false;
+  return found->second > std::ranges::count_if(planned, [&](const std::string& path) { return Key(path) == own; });
 }
 
 bool RunNames::TakenByRun(const std::string& path, const std::string& source) const {

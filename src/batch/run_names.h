@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <span>
 #include <string>
 #include <unordered_map>
 #include <unordered_set>
@@ -15,8 +16,9 @@ class RunNames {
  public:
   RunNames();
 
-  // A source of the run, and the path that its output would have.
-  void AddSource(const std::string& source, const std::string& planned);
+  // A source of the run; and a path that one of its outputs would have.
+  void AddSource(const std::string& source);
+  void AddPlanned(const std::string& planned);
 
   // Whether no other file of the run is concerned when this one's output is given its planned name.
   bool ConcernsNobodyElse(const std::string& source, const std::string& planned) const;
@@ -24,7 +26,7 @@ class RunNames {
   bool IsExpected(const std::string& path) const;
 
   // Whether the output of another file of the run may come to lie where this source is.
-  bool IsOutputOfOthers(const std::string& source, const std::string& planned) const;
+  bool IsOutputOfOthers(const std::string& source, std::span<const std::string> planned) const;
 
   // Whether another file of the run has the path as its source, or has been given it for its output.
   bool TakenByRun(const std::string& path, const std::string& source) const;

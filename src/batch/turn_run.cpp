@@ -26,9 +26,16 @@ class TurnBatch {
         job_(job),
         run_(
             files, job,
-            {.process = [this](size_t i) { return Process(i); }, .history = FileFunction::Transform, .dryRun = function.dryRun}) {
+            {.process =
+                 [this](size_t i) {
+                   const auto outcome = Process(i);
+                   return outcome ? std::vector{*outcome} : std::vector<FileOutcome>();
+                 }, .history = FileFunction::Transform, .dryRun = function.dryRun}) {
     for (const BatchFile& file : files_) {
-      if (file.status == Status::Ok) names_.AddSource(file.name, Planned(file));
+      if (file.status == Status::Ok) {
+        names_.AddSource(file.name);
+        names_.AddPlanned(Planned(file));
+      }
     }
   }
 

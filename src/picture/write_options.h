@@ -15,6 +15,7 @@ struct WriteOptions {
   bool keepMetadata = true;       // EXIF, XMP and ICC of the record go into formats that can hold them
   bool lossless = false;     // without any loss where the format can, whatever the settings say
   bool comment = false;           // the comment of the record goes into files of plug-in formats
+  int32_t quality = 0;       // 1 to 100, of formats with lossy compression; 0: as the settings say
   std::string password;           // for formats that can be protected; empty: none
   std::function<bool()> makeWay;  // called when the new file is whole, before it gets its name; false: it never does
 };

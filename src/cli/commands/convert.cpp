@@ -1,12 +1,16 @@
 #include "cli/commands/convert.h"
 
+#include <algorithm>
 #include <memory>
 #include <string>
+#include <vector>
 
 #include "batch/new_job.h"
+#include "batch/recipe_function.h"
 #include "batch/run.h"
 #include "cli/frame/destination_format.h"
 #include "cli/frame/file_selection.h"
+#include "cli/frame/recipe_text.h"
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
 #include "cli/frame/terminal_box.h"
@@ -21,11 +25,13 @@ namespace fotomill::cli {
 namespace {
 
 struct ConvertOptions {
+  bool apply = false;  // the command is `apply`: operations are needed, a format is not
   SelectionOptions selection;
   std::string to;
   std::string dest;
   std::string out;
-  std::string prefix;
+  std::vector<std::string> prefix;  // as often as it is given; the last one counts
+  std::string steps, recipe;        // --do, --recipe
   std::string overwrite;  // empty: ask where someone can answer, else keep both
   std::string metadata = "keep";
   int32_t quality = 0;  // 1 to 100; 0: as configured
@@ -56,34 +62,44 @@ void SetOverwritePolicy(const ConvertOptions& options, const CommandContext& con
   }
 }
 
-BatchFunction FunctionOf(const ConvertOptions& options) {
-  return {.transform = {},
-          .history = FileFunction::Convert,
-          .prefix = options.prefix,
-          .out = options.out,
-          .page = options.page,
-          .jobs = static_cast<uint32_t>(options.jobs),
-          .reduce = options.reduce,
-          .reduceHint = kReduceHint,
-          .autoOrient = options.autoOrient,
-          .keepMetadata = options.metadata == "keep",
-          .keepTimes = options.keepTimes,
-          .keepTree = options.keepTree,
-          .dryRun = options.dryRun};
+BatchFunction FunctionOf(const ConvertOptions& options, const Recipe* recipe) {
+  BatchFunction function{.history = FileFunction::Convert,
+                         .out = options.out,
+                         .page = options.page,
+                         .jobs = static_cast<uint32_t>(options.jobs),
+                         .reduce = options.reduce,
+                         .reduceHint = kReduceHint,
+                         .autoOrient = options.autoOrient,
+                         .keepMetadata = options.metadata == "keep",
+                         .keepTimes = options.keepTimes,
+                         .keepTree = options.keepTree,
+                         .dryRun = options.dryRun};
+  if (!options.prefix.empty() || !options.apply) function.prefix = options.prefix.empty() ? std::string() : options.prefix.back();
+  if (options.apply && recipe != nullptr && recipe->HasSteps()) function.history = FunctionOfFamily(recipe->First()->family);
+  return function;
+}
+
+// Reads the format that is asked for into `job`; none where every file keeps its own. What is wrong, or empty.
+std::string ReadFormat(const ConvertOptions& options, bool mayKeep, BatchJob& job) {
+  if (options.to.empty() && options.out.empty()) return mayKeep ? std::string() : "Say with --to which format to convert to.";
+  const std::string extension = options.to.empty() ? std::string(platform::ExtensionOf(options.out)) : options.to;
+  const std::string wrong = ReadDestinationFormat(extension, job);
+  const bool fromName = job.formatIndex == kNoFormat && options.to.empty();
+  return fromName ? "\"" + options.out + "\" selects no format; name one with --to." : wrong;
 }
 
 // What is wrong with the options, as a sentence; empty when nothing is. Takes the format into `job`.
-std::string CheckOptions(const ConvertOptions& options, const CommandContext& context, BatchJob& job) {
-  if (options.to.empty() && options.out.empty()) return "Say with --to which format to convert to.";
-  const std::string extension = options.to.empty() ? std::string(platform::ExtensionOf(options.out)) : options.to;
-  if (const std::string wrong = ReadDestinationFormat(extension, job); !wrong.empty()) {
-    return job.formatIndex != kNoFormat || !options.to.empty() ? wrong
-                                                               : "\"" + options.out + "\" selects no format; name one with --to.";
-  }
-  if (options.prefix.size() > kLongestPrefix) {
+std::string CheckOptions(const ConvertOptions& options, const CommandContext& context, const Recipe* recipe, BatchJob& job) {
+  const bool saves = recipe != nullptr && std::ranges::all_of(recipe->outputs, [](const RecipeOutput& output) {
+                       return !output.save.to.empty();
+                     });
+  if (const std::string wrong = ReadFormat(options, options.apply || saves, job); !wrong.empty()) return wrong;
+  if (recipe != nullptr && recipe->outputs.size() > 1 && !options.out.empty()) return "--out takes a recipe with one output.";
+  const std::string prefix = options.prefix.empty() ? std::string() : options.prefix.back();
+  if (prefix.size() > kLongestPrefix) {
     return "The prefix is longer than " + std::to_string(kLongestPrefix) + " characters.";
   }
-  if (!IsPlainName(options.prefix)) return "The prefix is a part of a name and cannot lead to a folder.";
+  if (!IsPlainName(prefix)) return "The prefix is a part of a name and cannot lead to a folder.";
   if (options.keepTree && options.dest.empty()) return "--keep-tree needs --dest.";
   if (options.overwrite == "ask" && !context.MayAsk()) return "--overwrite ask needs a terminal to ask on.";
   if (!options.dest.empty() && platform::FileExists(options.dest) && !platform::IsFolder(options.dest)) {
@@ -92,10 +108,41 @@ std::string CheckOptions(const ConvertOptions& options, const CommandContext& co
   return {};
 }
 
+// Hands the recipe to the function. What is wrong, or empty.
+std::string TakeRecipe(const ConvertOptions& options, const std::shared_ptr<const Recipe>& recipe, const BatchJob& job,
+                       BatchFunction& function) {
+  if (recipe == nullptr) return {};
+  BatchJob fallback;
+  const std::string extension(settings.DefaultFileExtension.view());
+  if (!ReadDestinationFormat(extension, fallback).empty()) (void)ReadDestinationFormat("png", fallback);
+  function.fallback = {fallback.formatIndex, fallback.extension};
+  const FormatLookup lookup = [](const std::string& name, int32_t& index, std::string& format) {
+    BatchJob found;
+    std::string wrong = ReadDestinationFormat(name, found);
+    index = found.formatIndex;
+    format = found.extension;
+    return wrong;
+  };
+  if (std::string wrong = SetRecipe(recipe, std::string(settings.ExifCopyrightHolder.view()), job, lookup, function); !wrong.empty()) {
+    return wrong;
+  }
+  if (options.quality > 0) {  // an option of the command line wins over the recipe
+    for (BatchOutput& output : function.outputs) {
+      output.quality = 0;
+      output.mostBytes = 0;
+    }
+  }
+  return {};
+}
+
 int RunConvert(const ConvertOptions& options, const CommandContext& context) {
   BatchJob job = NewBatchJob();
   job.remember = nullptr;
-  if (const std::string wrong = CheckOptions(options, context, job); !wrong.empty()) return UsageError(context, wrong);
+  std::shared_ptr<const Recipe> recipe;
+  if (!ReadRecipeOptions({options.steps, options.recipe, options.apply}, context, recipe)) return kExitUsage;
+  if (const std::string wrong = CheckOptions(options, context, recipe.get(), job); !wrong.empty()) return UsageError(context, wrong);
+  BatchFunction function = FunctionOf(options, recipe.get());
+  if (const std::string wrong = TakeRecipe(options, recipe, job, function); !wrong.empty()) return UsageError(context, wrong);
   const auto files = SelectFiles(options.selection, context);
   if (!files) return kExitUsage;
   if (!options.out.empty() && files->size() != 1) return UsageError(context, "--out takes exactly one picture.");
@@ -108,7 +155,7 @@ int RunConvert(const ConvertOptions& options, const CommandContext& context) {
   SetOverwritePolicy(options, context, job);
   TerminalBox box(output, options.verbose, options.overwrite.empty() && !job.overwrite.prompt);
   job.box = &box;
-  if (const Status status = RunBatch(*files, FunctionOf(options), job); status != Status::Ok) {
+  if (const Status status = RunBatch(*files, function, job); status != Status::Ok) {
     output.Message(output.ShownMessage(options.dest) + ": " + std::string(StatusMessage(status)));
     return kExitFailed;
   }
@@ -117,15 +164,18 @@ int RunConvert(const ConvertOptions& options, const CommandContext& context) {
 
 }  // namespace
 
-void SetUpConvert(CLI::App& app, CommandContext& context) {
-  auto options = std::make_shared<ConvertOptions>();
+namespace {
+
+void SetUp(CLI::App& app, CommandContext& context, const std::shared_ptr<ConvertOptions>& options) {
   AddSelection(app, options->selection, context);
   AddName(app, "-t,--to", options->to, "EXT", "Format to convert to, by its extension");
   CLI::Option* dest = AddName(app, "-d,--dest", options->dest, "DIR",
                               "Folder of the outputs, made with its parents; else they lie beside their sources");
   CLI::Option* out = AddName(app, "-o,--out", options->out, "FILE", "Name of the output, for one picture");
   Exclude(out, dest);
-  Exclude(AddText(app, "--prefix", options->prefix, "TEXT", "Put in front of every name"), out);
+  Exclude(AddRepeatedText(app, "--prefix", options->prefix, "TEXT", "Put in front of every name"), out);
+  CLI::Option* steps = AddText(app, "--do", options->steps, "TEXT", "Operations to apply, separated by \";\": 'resize 50%; sharpen 0.5'");
+  Exclude(AddName(app, "--recipe", options->recipe, "FILE|NAME", "Recipe to apply (see \"fotomill recipe list\")"), steps);
   AddChoice(app, "--overwrite", options->overwrite, "HOW", {"ask", "replace", "keep-both", "skip"},
             "ask (the way on a terminal), replace, keep-both (elsewhere) or skip files of an output's name");
   AddFlag(app, "--keep-tree", options->keepTree, "Rebuild the folders of named folders in --dest");
@@ -139,8 +189,24 @@ void SetUpConvert(CLI::App& app, CommandContext& context) {
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would be done");
   AddFlag(app, "-v,--verbose", options->verbose, "Say when a format cannot hold a picture's metadata");
   AddFlag(app, "--json", options->json, "One JSON array of {file, destination, status, message}");
-  SetFooter(app, "Example: fotomill convert holiday -r --to png --dest out --keep-tree");
   context.run = [options, &context] { return RunConvert(*options, context); };
+}
+
+}  // namespace
+
+void SetUpConvert(CLI::App& app, CommandContext& context) {
+  SetUp(app, context, std::make_shared<ConvertOptions>());
+  SetFooter(app, "Example: fotomill convert holiday -r --to png --dest out --keep-tree");
+}
+
+void SetUpApply(CLI::App& app, CommandContext& context) {
+  auto options = std::make_shared<ConvertOptions>();
+  options->apply = true;
+  SetUp(app, context, options);
+  SetFooter(app,
+            "Without --to and without \"save\" in the recipe, each output has the format of its source. \"fotomill operations\" lists\n"
+            "the operations, \"fotomill operations NAME\" explains one.\n\n"
+            "Example: fotomill apply holiday --do 'resize 1600x1600 only=shrink; sharpen 0.5' --to jpg --dest out");
 }
 
 }  // namespace fotomill::cli

@@ -9,7 +9,9 @@
 #include "cli/commands/history.h"
 #include "cli/commands/info.h"
 #include "cli/commands/match.h"
+#include "cli/commands/operations.h"
 #include "cli/commands/plugins.h"
+#include "cli/commands/recipe.h"
 #include "cli/commands/rename.h"
 #include "cli/commands/tdb.h"
 #include "cli/commands/thumbs.h"
@@ -24,6 +26,11 @@ namespace {
 // clang-format off
 constexpr Command kCommands[] = {
     {"convert", "convert pictures to another format",                          Needs::Formats,  SetUpConvert},
+    {"apply",   "apply operations to pictures: resize, sharpen, crop, ...",    Needs::Formats,  SetUpApply},
+    {"operations", "list the operations, or explain one",                      Needs::Settings, SetUpOperations},
+    {"recipe list",  "list the recipes",                                       Needs::Settings, SetUpRecipeList},
+    {"recipe show",  "print a recipe",                                         Needs::Settings, SetUpRecipeShow},
+    {"recipe check", "check recipes for mistakes",                             Needs::Settings, SetUpRecipeCheck},
     {"rename",  "number files, each under a base name or with its own",        Needs::Formats,  SetUpRename},
     {"contact-sheet", "draw pictures on pages, each with its name",            Needs::Formats,  SetUpContactSheet},
     {"turn",    "rotate or flip pictures, JPEG without loss",                  Needs::Formats,  SetUpTurn},

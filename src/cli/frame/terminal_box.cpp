@@ -24,6 +24,7 @@ void TerminalBox::ShowElement(const FileOutcome& outcome) {
   Json element;
   PutName(element, "file", outcome.source);
   PutName(element, "destination", outcome.status == Status::Ok ? outcome.destination : std::string());
+  if (!outcome.output.empty()) element["output"] = outcome.output;
   PutStatus(element, outcome.status);
   if (outcome.skipped) element["skipped"] = true;
   if (!outcome.note.empty()) element["note"] = outcome.note;

@@ -205,7 +205,7 @@ void SetResolution(jpeg_compress_struct& info, const PictureMetadata& metadata) 
   info.Y_density = clamp(metadata.dpiY > 0 ? metadata.dpiY : settings.TiffResolution);
 }
 
-void SetParameters(JpegWriter& writer, const PictureRecord& picture, bool gray) {
+void SetParameters(JpegWriter& writer, const PictureRecord& picture, bool gray, int32_t quality) {
   jpeg_compress_struct& info = writer.info;
   jpeg_create_compress(&info);
   info.client_data = &writer.out;
@@ -218,7 +218,7 @@ void SetParameters(JpegWriter& writer, const PictureRecord& picture, bool gray) 
   info.input_components = gray ? 1 : 3;
   info.in_color_space = gray ? JCS_GRAYSCALE : JCS_EXT_BGR;
   jpeg_set_defaults(&info);
-  jpeg_set_quality(&info, std::clamp<int>(settings.JpegCompression, 1, 100), TRUE);
+  jpeg_set_quality(&info, std::clamp<int>(quality > 0 ? quality : settings.JpegCompression, 1, 100), TRUE);
   SetSampling(info);
   SetResolution(info, picture.metadata);
   if (settings.WriteJpegProgressive != 0) {
@@ -278,12 +278,12 @@ void ExpandRow(const PictureRecord& picture, int32_t y, bool gray, std::vector<u
   }
 }
 
-Status WriteAll(JpegWriter& writer, PictureRecord& picture, bool keep) {
+Status WriteAll(JpegWriter& writer, PictureRecord& picture, bool keep, int32_t quality) {
   const PackedImage& image = picture.image;
   const bool gray = HasGrayPalette(picture);
   std::vector<uint8_t> expanded(image.Bits() == 24 ? 0 : (gray ? 1 : 3) * static_cast<size_t>(image.Width()));
   const bool written = Guarded(writer.errors, [&] {
-    SetParameters(writer, picture, gray);
+    SetParameters(writer, picture, gray, quality);
     jpeg_start_compress(&writer.info, TRUE);
     if (keep) WriteMetadata(writer.info, picture);
     for (int32_t y = 0; y < image.Height(); ++y) {
@@ -367,7 +367,7 @@ Status JpegWrite(PictureRecord& picture, const WriteOptions& options) {
   if (picture.image.Width() > JPEG_MAX_DIMENSION || picture.image.Height() > JPEG_MAX_DIMENSION) return Status::UnsuitableImage;
   JpegWriter writer;
   if (!writer.out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
-  RETURN_IF_BAD(WriteAll(writer, picture, options.keepMetadata && settings.PreserveEXIF != 0));
+  RETURN_IF_BAD(WriteAll(writer, picture, options.keepMetadata && settings.PreserveEXIF != 0, options.quality));
   return CommitOutput(writer.out, options);
 }
 

@@ -283,11 +283,11 @@ void FillRow(const PictureRecord& picture, int32_t y, uint32_t* target) {
   }
 }
 
-Status Encode(const PictureRecord& picture, bool lossless, WebPMemoryWriter& encoded) {
+Status Encode(const PictureRecord& picture, bool lossless, int32_t quality, WebPMemoryWriter& encoded) {
   WebPConfig config;
   WebPPicture source;
-  const auto quality = static_cast<float>(std::clamp<int32_t>(settings.WebPQualityFactor, 0, 100));
-  if (WebPConfigPreset(&config, WEBP_PRESET_DEFAULT, quality) == 0 || WebPPictureInit(&source) == 0) return Status::ResourceError;
+  const auto factor = static_cast<float>(std::clamp<int32_t>(quality > 0 ? quality : settings.WebPQualityFactor, 0, 100));
+  if (WebPConfigPreset(&config, WEBP_PRESET_DEFAULT, factor) == 0 || WebPPictureInit(&source) == 0) return Status::ResourceError;
   config.lossless = lossless ? 1 : 0;
   config.exact = lossless ? 1 : 0;
   source.use_argb = 1;
@@ -398,10 +398,11 @@ Status WebpWrite(PictureRecord& picture, const WriteOptions& options) {
   if (picture.image.Width() > WEBP_MAX_DIMENSION || picture.image.Height() > WEBP_MAX_DIMENSION) return Status::UnsuitableImage;
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
-  const bool lossless = options.lossless || settings.WebPLossless != 0;
+  const bool lossless = options.lossless || (options.quality == 0 && settings.WebPLossless != 0);
   EncodedFile encoded, other;
-  RETURN_IF_BAD(Encode(picture, lossless, encoded.writer));
-  if (!options.lossless && settings.WebPAllowMixed != 0) RETURN_IF_BAD(Encode(picture, !lossless, other.writer));
+  RETURN_IF_BAD(Encode(picture, lossless, options.quality, encoded.writer));
+  const bool mixed = !options.lossless && options.quality == 0 && settings.WebPAllowMixed != 0;
+  if (mixed) RETURN_IF_BAD(Encode(picture, !lossless, 0, other.writer));
   const bool useOther = other.writer.size > 0 && other.writer.size < encoded.writer.size;
   const WebPMemoryWriter& chosen = useOther ? other.writer : encoded.writer;
   const std::span<const uint8_t> bytes(chosen.mem, chosen.size);

@@ -1,0 +1,76 @@
+#include "batch/recipe_function.h"
+
+#include <algorithm>
+
+#include "batch/abort.h"
+#include "operations/engine.h"
+#include "platform/files.h"
+
+namespace fotomill {
+
+namespace {
+
+// What the steps of every output share.
+struct RecipeRun {
+  std::shared_ptr<const Recipe> recipe;
+  std::string copyrightHolder;
+  uint32_t threads = 0;
+
+  MacroFacts FactsOf(const std::string& source) const {
+    return {.fileName = source, .copyrightHolder = copyrightHolder, .modified = platform::FactsOf(source).modified};
+  }
+  Status Apply(PictureRecord& picture, std::span<const Step> steps) const {
+    if (steps.empty()) return Status::Ok;
+    return ApplySteps(picture, steps,
+                      {.work = {.threads = threads, .goesOn = [] { return !AbortAsked(); }},
+                       .facts = FactsOf(std::string(picture.fileName.view()))});
+  }
+};
+
+bool HasQuality(std::string_view extension) { return extension == "JPG" || extension == "WEBP"; }
+
+std::string ReadFormat(const SaveStep& save, const BatchJob& job, const FormatLookup& lookup, BatchOutput& output) {
+  // An option of the command line wins over the recipe.
+  if (job.formatIndex == kNoFormat && !save.to.empty()) {
+    if (std::string wrong = lookup(save.to, output.formatIndex, output.extension); !wrong.empty()) return wrong;
+  }
+  const std::string& format = job.formatIndex != kNoFormat ? job.extension : output.extension;
+  const bool lossy = format.empty() || HasQuality(format);
+  if (save.mostBytes > 0 && !lossy) return "max-bytes needs a format with a quality, such as jpg or webp; not " + format + ".";
+  return {};
+}
+
+}  // namespace
+
+FileFunction FunctionOfFamily(Family family) {
+  constexpr FileFunction kFunctions[] = {FileFunction::Crop,     FileFunction::Transform, FileFunction::Effects, FileFunction::Filter,
+                                         FileFunction::Annotate, FileFunction::Watermark, FileFunction::Matt};
+  return kFunctions[static_cast<size_t>(family)];
+}
+
+std::string SetRecipe(std::shared_ptr<const Recipe> recipe, const std::string& copyrightHolder, const BatchJob& job,
+                      const FormatLookup& lookup, BatchFunction& function) {
+  const auto run = std::make_shared<RecipeRun>(RecipeRun{recipe, copyrightHolder, function.jobs == 1 ? 1u : 0u});
+  function.transform = [run](PictureRecord& picture) { return run->Apply(picture, run->recipe->common); };
+  function.autoOrient = function.autoOrient || recipe->HasSteps();
+  for (size_t i = 0; i < recipe->outputs.size(); ++i) {
+    const RecipeOutput& wanted = recipe->outputs[i];
+    BatchOutput& output = function.outputs.emplace_back();
+    output.label = wanted.name;
+    output.folder = wanted.save.folder;
+    output.quality = wanted.save.quality;
+    output.mostBytes = wanted.save.mostBytes;
+    output.transform = [run, i](PictureRecord& picture) { return run->Apply(picture, run->recipe->outputs[i].steps); };
+    if (!wanted.save.name.empty()) {
+      output.nameNeedsPicture = !IsKnownEarly(wanted.save.name);
+      output.name = [run, i](const std::string& source, const PictureRecord* picture) {
+        static const PictureRecord kNone;
+        return ExpandNameMacros(run->recipe->outputs[i].save.name, run->FactsOf(source), picture != nullptr ? *picture : kNone);
+      };
+    }
+    if (std::string wrong = ReadFormat(wanted.save, job, lookup, output); !wrong.empty()) return wrong;
+  }
+  return {};
+}
+
+}  // namespace fotomill

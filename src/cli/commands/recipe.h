@@ -1,0 +1,12 @@
+#pragma once
+
+#include "cli/frame/command.h"
+
+namespace fotomill::cli {
+
+// The commands about recipes.
+void SetUpRecipeList(CLI::App& app, CommandContext& context);
+void SetUpRecipeShow(CLI::App& app, CommandContext& context);
+void SetUpRecipeCheck(CLI::App& app, CommandContext& context);
+
+}  // namespace fotomill::cli
