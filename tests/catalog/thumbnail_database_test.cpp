@@ -90,8 +90,9 @@ TEST_F(Database, IsLaidOutToTheByte) {
   EXPECT_EQ(part(60 + 28434, 8), std::string(8, '\0'));
   EXPECT_EQ(database.Delete("/a"), 1);
   EXPECT_EQ(ReadBytes(Path())[60 + 28434], 1);
-  const std::atomic<bool> stop = true;
-  EXPECT_EQ(database.CompactThumbnailDatabase(false, nullptr, &stop), Compacted::Stopped);
+  const StopSource stop;
+  stop.Stop();
+  EXPECT_EQ(database.CompactThumbnailDatabase(false, nullptr, stop.Token()), Compacted::Stopped);
   EXPECT_EQ(Size(), 28502u);
   EXPECT_EQ(database.CompactThumbnailDatabase(false), Compacted::Done);
   EXPECT_EQ(Size(), 60u);

@@ -216,11 +216,12 @@ TEST_F(Reports, OrphansBelowAreFoundWhenAskedFor) {
   Sample("a.bmp");
   ASSERT_TRUE(platform::MakeFolders(folder_.Path("sub")));
   for (const char* name : {"A.THN", "gone.thn", ".hidden.THN", "sub/gone.THN"}) test::WriteText(folder_.Path(name), "");
-  const std::atomic<bool> stop = false, stopped = true;
-  EXPECT_THAT(FindOrphanThumbnails(folder_.Path(), false, stop), ElementsAre(folder_.Path("gone.thn")));
-  const std::vector<std::string> all = FindOrphanThumbnails(folder_.Path(), true, stop);
+  const StopSource stop, stopped;
+  stopped.Stop();
+  EXPECT_THAT(FindOrphanThumbnails(folder_.Path(), false, stop.Token()), ElementsAre(folder_.Path("gone.thn")));
+  const std::vector<std::string> all = FindOrphanThumbnails(folder_.Path(), true, stop.Token());
   EXPECT_THAT(all, ElementsAre(folder_.Path("gone.thn"), folder_.Path("sub/gone.THN")));
-  EXPECT_TRUE(FindOrphanThumbnails(folder_.Path(), true, stopped).empty());
+  EXPECT_TRUE(FindOrphanThumbnails(folder_.Path(), true, stopped.Token()).empty());
   EXPECT_TRUE(DeleteThumbnails(all).empty());
   EXPECT_TRUE(platform::FileExists(folder_.Path("A.THN")));
   EXPECT_FALSE(platform::FileExists(folder_.Path("sub/gone.THN")));

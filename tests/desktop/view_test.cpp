@@ -310,6 +310,23 @@ TEST(ThumbnailLoader, AReadyThumbnailIsLoadedOnce) {
   EXPECT_EQ(order, "ready embedded? none?- embedded none ");
 }
 
+TEST(ThumbnailLoader, AFileThatNeedsTooMuchMemoryIsNoEndOfTheProgram) {
+  static std::atomic<bool> idle;
+  const auto load = [](const ThumbnailWish& wish) -> ThumbnailPointer {
+    if (wish.path == "huge") throw std::bad_alloc();
+    return std::make_shared<Thumbnail>();
+  };
+  ThumbnailLoader loader(
+      1, [] {}, load, [] { idle = true; });
+  loader.Want({{"huge", 1, 2, 96, 0}, {"small", 1, 2, 96, 0}});
+  while (!idle) std::this_thread::yield();
+  const auto results = loader.TakeResults();
+  ASSERT_EQ(results.size(), 2u);
+  EXPECT_EQ(results[0].thumbnail->status, Status::MemoryAllocationError);
+  EXPECT_EQ(results[1].thumbnail->status, Status::Ok);
+  EXPECT_EQ(loader.Pending(), 0u);
+}
+
 TEST(ThumbnailCache, KeepsTheLastUsedWithinItsBytes) {
   const auto picture = [] {
     auto thumbnail = std::make_shared<Thumbnail>();

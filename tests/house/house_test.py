@@ -44,6 +44,9 @@ SYSTEM_HEADER = re.compile(
     r"filesystem|fstream")
 SYSTEM_MACRO = re.compile(r"\s*#\s*(if|elif|ifdef|ifndef).*(_WIN32|_WIN64|\bWIN32|__WINDOWS__|__linux|__unix|__APPLE__|__MINGW|_MSC_VER|"
                           r"__FreeBSD__|__ANDROID__)")
+# Who begins a thread: the pool, and what the system needs one for. Everybody else gives the pool a task.
+THREAD = re.compile(r"std::(j?thread\b(?!::)|async\b)|\bpthread_create\b|\bwxThread\b")
+THREAD_FOLDERS = ("src/core/workers/worker_pool.", "src/platform/")
 INCLUDE = re.compile(r'\s*#\s*include\s*(["<])([^">]+)[">]')
 
 # Rooms whose code still reads the settings itself; they lose their place here one by one.
@@ -142,6 +145,8 @@ def breaches(project):
         for number, line in enumerate(lines, 1):
             for message in include_breaches(path, line):
                 yield name, number, message
+            if THREAD.search(line.split("//")[0]) and not name.startswith(THREAD_FOLDERS):
+                yield name, number, "begins a thread; have src/core/workers do it"
             if SYSTEM_MACRO.match(line) and name not in SYSTEM_HEADERS and not any(name.startswith(folder + "/") for folder in SYSTEM_FOLDERS):
                 yield name, number, "asks which system it runs on outside src/platform"
     yield from circle_breaches(includes)
@@ -169,6 +174,10 @@ EXAMPLES = [
     ("src/core/open.cpp", "#include <sys/stat.h>\n", "behind a door"),
     ("src/core/stream.cpp", "#include <fstream>\n", "behind a door"),
     ("src/core/switch.cpp", "#if defined(_WIN32)\n#endif\n", "asks which system"),
+    ("src/core/workers/worker_pool.cpp", "std::thread one;  // std::this_thread::yield()\n", None),
+    ("src/core/thread.cpp", "const auto work = std::async(Work);\n", "begins a thread"),
+    ("src/desktop/loader.h", "  std::vector<std::thread> workers_;\n", "begins a thread"),
+    ("src/desktop/sleep.cpp", "std::this_thread::yield();  // no std::thread\n", None),
     ("src/core/window.cpp", "#include <wx/wx.h>\n", "outside src/desktop"),
     ("src/core/egg.h", '#include "core/hen.h"\n', "includes itself"),
     ("src/core/hen.h", '#include "core/egg.h"\n', None),

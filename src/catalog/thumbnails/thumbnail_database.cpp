@@ -400,7 +400,7 @@ int64_t ThumbnailDatabase::Delete(const std::string& path) {
 }
 
 ThumbnailDatabase::Compacted ThumbnailDatabase::CopyLiveRecords(platform::StoreFile& to, DatabaseHeader header, bool purge,
-                                                                ProgressSink* progress, const std::atomic<bool>* stop) {
+                                                                ProgressSink* progress, const StopToken& stop) {
   const int32_t count = header.count;
   header.count = 0;
   // The header comes first, so that what an interrupted pass leaves is known as ours by its first bytes.
@@ -408,8 +408,7 @@ ThumbnailDatabase::Compacted ThumbnailDatabase::CopyLiveRecords(platform::StoreF
   std::vector<uint8_t> bytes(kDatabaseRecordSize);
   for (int32_t i = 0; i < count; ++i) {
     if (progress != nullptr) progress->Step(i, count);
-    if (platform::PendingExit() != 0) return Compacted::Failed;
-    if (stop != nullptr && *stop) return Compacted::Stopped;
+    if (stop.Asked()) return Compacted::Stopped;
     if (!file_.ReadAt(OffsetOf(i), bytes) || !ByteReader(bytes).Match(kSmallThumbnailMagic)) return Compacted::NotRead;
     DatabaseKey key;
     TakeKey(std::span<const uint8_t>(bytes).subspan(kPathOffset), key);
@@ -423,13 +422,13 @@ ThumbnailDatabase::Compacted ThumbnailDatabase::CopyLiveRecords(platform::StoreF
 }
 
 ThumbnailDatabase::Compacted ThumbnailDatabase::CompactThumbnailDatabase(bool purge, ProgressSink* progress,
-                                                                         const std::atomic<bool>* stop) {
+                                                                         const StopToken& stop) {
   const Compacted result = CompactLocked(purge, progress, stop);
   if (result == Compacted::Done && OpenThumbnailDatabase(path_, false, hidden_) != Opened::Done) return Compacted::NotRead;
   return result;
 }
 
-ThumbnailDatabase::Compacted ThumbnailDatabase::CompactLocked(bool purge, ProgressSink* progress, const std::atomic<bool>* stop) {
+ThumbnailDatabase::Compacted ThumbnailDatabase::CompactLocked(bool purge, ProgressSink* progress, const StopToken& stop) {
   using platform::StoreFile;
   DatabaseHeader header;
   if (!LockAndCheck(header)) return Compacted::NotRead;

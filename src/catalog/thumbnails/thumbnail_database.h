@@ -10,6 +10,7 @@
 #include "catalog/thumbnails/thumbnail_index.h"
 #include "catalog/thumbnails/thumbnail_record.h"
 #include "core/progress.h"
+#include "core/workers/stop_token.h"
 #include "platform/store_file.h"
 
 namespace fotomill {
@@ -129,7 +130,7 @@ class ThumbnailDatabase {
   // Copies what is not deleted (and with `purgeMissing`, whose picture is there) into "PATH.BAK", which then takes the
   // database's place in one step. Otherwise the database stays as it was.
   Compacted CompactThumbnailDatabase(bool purgeMissing, ProgressSink* progress = nullptr,
-                                     const std::atomic<bool>* stop = nullptr);
+                                     const StopToken& stop = {});
 
  private:
   enum class KeyRead { Done, NoThumbnail, Failed };
@@ -143,9 +144,9 @@ class ThumbnailDatabase {
   bool WriteRecords(std::span<const DatabaseRecord> records, int64_t first);
   bool WriteDatabaseHeader(const DatabaseHeader& header);
   bool MarkDeleted(int64_t index);
-  Compacted CompactLocked(bool purge, ProgressSink* progress, const std::atomic<bool>* stop);
+  Compacted CompactLocked(bool purge, ProgressSink* progress, const StopToken& stop);
   Compacted CopyLiveRecords(platform::StoreFile& to, DatabaseHeader header, bool purge, ProgressSink* progress,
-                            const std::atomic<bool>* stop);
+                            const StopToken& stop);
 
   std::string path_;
   bool hidden_ = false;

@@ -291,8 +291,10 @@ int RunCompact(const TdbOptions& options, CommandContext& context) {
     output.Line(std::to_string(before.count) + " -> " + std::to_string(after.count) + " records");
     return kExitOk;
   }
-  const bool unread = result == ThumbnailDatabase::Compacted::NotRead;
-  output.Failure(path, unread ? Status::FileReadError : Status::ErrorWritingFile, "The database stays as it was.");
+  const Status status = result == ThumbnailDatabase::Compacted::NotRead   ? Status::FileReadError
+                        : result == ThumbnailDatabase::Compacted::Stopped ? Status::FunctionCancelled
+                                                                          : Status::ErrorWritingFile;
+  output.Failure(path, status, "The database stays as it was.");
   return kExitFailed;
 }
 

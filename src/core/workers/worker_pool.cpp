@@ -191,7 +191,9 @@ CoreRelease::~CoreRelease() {
 Helpers::Helpers(WorkerPool& pool, unsigned most, std::function<bool()> step) : pool_(pool) {
   work_.step = std::move(step);
   work_.most = most;
-  ownCore_ = coreOf != &pool;
+  ownCore_ = coreOf == nullptr;
+  if (ownCore_) coreOf = &pool_;
+  if (ownCore_) coreIsUrgent = true;
   const std::lock_guard lock(pool_.mutex_);
   if (ownCore_) ++pool_.busy_;
   if (most == 0) return;
@@ -203,7 +205,9 @@ Helpers::~Helpers() {
   std::unique_lock lock(pool_.mutex_);
   std::erase(pool_.spare_, &work_);
   pool_.helped_.wait(lock, [this] { return work_.running == 0; });
-  if (ownCore_) pool_.GiveCore();
+  if (!ownCore_) return;
+  coreOf = nullptr;
+  pool_.GiveCore();
 }
 
 }  // namespace fotomill

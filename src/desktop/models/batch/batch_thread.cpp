@@ -127,14 +127,13 @@ class BatchThread::Questions : public Prompts {
 };
 
 BatchThread::~BatchThread() {
-  if (!thread_.joinable()) return;
+  if (!task_.Running()) return;
   Abort();
   {
     const std::lock_guard lock(mutex_);
     given_ = true;
   }
   answered_.notify_all();
-  thread_.join();
 }
 
 void BatchThread::Start(std::vector<BatchFile> files, BatchFunction function, BatchJob job) {
@@ -144,17 +143,19 @@ void BatchThread::Start(std::vector<BatchFile> files, BatchFunction function, Ba
 }
 
 void BatchThread::StartWork(BatchJob job, Work work) {
-  if (thread_.joinable()) thread_.join();
+  task_.Wait();
   job_ = std::move(job);
   // The settings belong to the window's thread.
   job_.remember = [this](Remembered what, int32_t value) { Tell([what, value] { StoreRemembered(what, value); }); };
   running_ = true;
-  thread_ = std::thread([this, work = std::move(work), thumbnails = ThumbnailOptionsFromSettings()] {
+  const auto run = [this, work = std::move(work), thumbnails = ThumbnailOptionsFromSettings()](const StopToken&) {
     Box box(*this);
     Questions questions(*this, thumbnails);
     job_.box = &box;
     job_.prompts = &questions;
-    const Status status = work(job_);
+    return work(job_);
+  };
+  task_.Start(Lane::Blocking, run, [this](Status status) {
     job_.box = nullptr;
     job_.prompts = nullptr;
     Tell([this, status] {

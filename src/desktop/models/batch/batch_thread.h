@@ -6,7 +6,6 @@
 #include <mutex>
 #include <optional>
 #include <string>
-#include <thread>
 #include <vector>
 
 #include "batch/job.h"
@@ -14,6 +13,7 @@
 #include "batch/prompts.h"
 #include "batch/run.h"
 #include "catalog/thumbnails/thumbnail_options.h"
+#include "core/workers/background_task.h"
 #include "desktop/models/drawing/rgb_image.h"
 
 namespace fotomill::desktop {
@@ -42,11 +42,11 @@ class BatchWindows {
   virtual std::optional<std::string> AskPassword(const std::string& path) = 0;
   virtual bool ConfirmFormat(const std::string& question) = 0;
   virtual bool Confirm(const std::string& question, const std::string& yes) = 0;
-  // After everything else; the thread is about to end.
+  // After everything else. MemoryAllocationError where the batch itself ran out of memory.
   virtual void BatchEnded(Status status, const BatchJob& job) = 0;
 };
 
-// Runs one batch on a thread of its own; its reports and questions go to the windows by `post`, which has to run what it is
+// Runs one batch apart; its reports and questions go to the windows by `post`, which has to run what it is
 // given on the window's thread, in order. A question holds the batch until it is answered.
 class BatchThread {
  public:
@@ -76,11 +76,11 @@ class BatchThread {
   BatchWindows& windows_;
   const Post post_;
   BatchJob job_;
-  std::thread thread_;
   std::mutex mutex_;
   std::condition_variable answered_;
   bool given_ = false;    // up
   bool running_ = false;  // belongs to the window's thread
+  BackgroundTask task_;   // last: it uses the rest
 };
 
 // What the overwrite prompt shows of the file that is there and of the new picture, which may be missing.

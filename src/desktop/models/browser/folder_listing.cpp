@@ -46,14 +46,14 @@ class TakenDate : public ExifSink {
 
 }  // namespace
 
-FolderListing ListForBrowser(const std::string& folder, bool facts, const std::atomic<bool>& stop) {
+FolderListing ListForBrowser(const std::string& folder, bool facts, const StopToken& stop) {
   FolderListing listing;
   const auto entries = platform::ListFolder(folder);
   if (!entries) return listing;
   listing.readable = true;
   FormatFinder formats;
   for (const platform::FolderEntry& entry : *entries) {
-    if (stop) return listing;
+    if (stop.Asked()) return listing;
     if (entry.name.starts_with('.')) continue;
     FolderItem item;
     item.name = entry.name;
@@ -76,9 +76,9 @@ std::vector<std::string> SubfolderNames(const std::string& folder) {
   return names;
 }
 
-void AddFacts(const std::string& folder, FolderListing& listing, const std::atomic<bool>& stop) {
+void AddFacts(const std::string& folder, FolderListing& listing, const StopToken& stop) {
   for (FolderItem& item : listing.items) {
-    if (stop) return;
+    if (stop.Asked()) return;
     const platform::FileFacts facts = platform::FactsOf(platform::JoinFolder(folder, item.name));
     item.size = item.folder ? 0 : facts.size;
     item.modified = facts.modified;

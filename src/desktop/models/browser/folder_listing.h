@@ -1,9 +1,10 @@
 #pragma once
 
-#include <atomic>
 #include <cstdint>
 #include <string>
 #include <vector>
+
+#include "core/workers/stop_token.h"
 
 namespace fotomill::desktop {
 
@@ -27,14 +28,14 @@ struct FolderListing {
 };
 
 // What a browser shows of a folder: folders, and files of known formats, without hidden ones and thumbnail files. With
-// `facts` off, sizes and times stay 0, which is many times faster. Ends early, with what it has, when `stop` turns true.
-FolderListing ListForBrowser(const std::string& folder, bool facts, const std::atomic<bool>& stop);
+// `facts` off, sizes and times stay 0, which is many times faster. Ends early, with what it has, when `stop` is asked.
+FolderListing ListForBrowser(const std::string& folder, bool facts, const StopToken& stop);
 
 // The names of the folders in a folder, without hidden ones, in order.
 std::vector<std::string> SubfolderNames(const std::string& folder);
 
 // Fills in size and time of listed items.
-void AddFacts(const std::string& folder, FolderListing& listing, const std::atomic<bool>& stop);
+void AddFacts(const std::string& folder, FolderListing& listing, const StopToken& stop);
 
 // Fills in dimensions, depth and EXIF date of one file from its header.
 void AddPictureFacts(const std::string& folder, FolderItem& item);

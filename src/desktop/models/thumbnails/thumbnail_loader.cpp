@@ -2,24 +2,13 @@
 
 #include <algorithm>
 
-#include "platform/process.h"
+#include "core/workers/folder_scope.h"
+#include "core/workers/guarded.h"
 
 namespace fotomill::desktop {
 
-ThumbnailLoader::ThumbnailLoader(unsigned workers, std::function<void()> wake, Load load, void (*idle)())
-    : wake_(std::move(wake)), load_(load), idle_(idle) {
-  for (unsigned i = 0; i < workers; ++i) workers_.emplace_back([this] { Work(); });
-}
-
-ThumbnailLoader::~ThumbnailLoader() {
-  {
-    const std::lock_guard lock(mutex_);
-    stop_ = true;
-    wishes_.clear();
-  }
-  wanted_.notify_all();
-  for (std::thread& worker : workers_) worker.join();
-}
+ThumbnailLoader::ThumbnailLoader(unsigned atOnce, std::function<void()> wake, Load load, void (*idle)())
+    : wake_(std::move(wake)), load_(load), idle_(idle), work_(Lane::Compute, atOnce, [this] { return Next(); }) {}
 
 void ThumbnailLoader::Want(std::vector<ThumbnailWish> wishes) {
   {
@@ -28,7 +17,7 @@ void ThumbnailLoader::Want(std::vector<ThumbnailWish> wishes) {
     std::reverse(wishes.begin(), wishes.end());
     wishes_ = std::move(wishes);
   }
-  wanted_.notify_all();
+  work_.Look();
 }
 
 std::vector<ThumbnailLoader::Result> ThumbnailLoader::TakeResults() {
@@ -41,33 +30,41 @@ size_t ThumbnailLoader::Pending() const {
   return wishes_.size() + inWork_.size() + results_.size();
 }
 
-void ThumbnailLoader::Work() {
-  std::unique_lock lock(mutex_);
-  while (true) {
-    wanted_.wait(lock, [this] { return stop_ || !wishes_.empty(); });
-    if (stop_) return;
-    ThumbnailWish wish = std::move(wishes_.back());
-    wishes_.pop_back();
-    inWork_.push_back(wish);
-    lock.unlock();
-    ThumbnailPointer thumbnail = load_(wish);
-    lock.lock();
-    inWork_.erase(std::ranges::find(inWork_, wish));
-    if (wish.standIn && thumbnail != nullptr && !thumbnail->standIn) {
-      wish.standIn = false;
-      std::erase(wishes_, wish);
-    }
-    const bool tell = results_.empty() && !stop_;
-    results_.push_back({std::move(wish), std::move(thumbnail)});
-    const bool last = wishes_.empty() && inWork_.empty();
-    lock.unlock();
-    if (tell) wake_();
-    if (last) idle_();
-    lock.lock();
-  }
+LatestWork::Piece ThumbnailLoader::Next() {
+  const std::lock_guard lock(mutex_);
+  if (wishes_.empty()) return {};
+  ThumbnailWish wish = std::move(wishes_.back());
+  wishes_.pop_back();
+  inWork_.push_back(wish);
+  return [this, wish = std::move(wish)] { LoadOne(wish); };
 }
 
-unsigned WorkerCount() { return std::max(platform::CoreCount(), 2u) - 1; }
+void ThumbnailLoader::LoadOne(ThumbnailWish wish) {
+  ThumbnailPointer thumbnail;
+  const Status status = Guarded([&] {
+    const FolderScope folder(wish.path);
+    thumbnail = load_(wish);
+  });
+  if (status != Status::Ok) {
+    auto failed = std::make_shared<Thumbnail>();
+    failed->status = status;
+    thumbnail = std::move(failed);
+  }
+  std::unique_lock lock(mutex_);
+  inWork_.erase(std::ranges::find(inWork_, wish));
+  if (wish.standIn && thumbnail != nullptr && !thumbnail->standIn) {
+    wish.standIn = false;
+    std::erase(wishes_, wish);
+  }
+  const bool tell = results_.empty();
+  results_.push_back({std::move(wish), std::move(thumbnail)});
+  const bool last = wishes_.empty() && inWork_.empty();
+  lock.unlock();
+  if (tell) wake_();
+  if (last) idle_();
+}
+
+unsigned ThumbnailsAtOnce() { return std::max(WorkerPool::Shared().Cores(), 2u) - 1; }
 
 ThumbnailPointer ThumbnailCache::Find(const ThumbnailWish& wish) {
   const auto found = places_.find(wish.path);

@@ -1,20 +1,19 @@
 #pragma once
 
-#include <condition_variable>
 #include <cstdint>
 #include <functional>
 #include <list>
 #include <mutex>
 #include <string>
-#include <thread>
 #include <unordered_map>
 #include <vector>
 
+#include "core/workers/latest_work.h"
 #include "desktop/models/thumbnails/thumbnail.h"
 
 namespace fotomill::desktop {
 
-// Loads thumbnails on worker threads, in the order in which they are wanted now. The wish of a result tells whether it is a
+// Loads thumbnails on threads of the pool, in the order in which they are wanted now. The wish of a result tells whether it is a
 // stand-in; its thumbnail is null when there is none. Where a stand-in was wanted and the proper one was ready, nobody loads it
 // again.
 class ThumbnailLoader {
@@ -28,9 +27,9 @@ class ThumbnailLoader {
 
   // `wake` is called on a worker when results wait that nobody was told of yet, `idle` on the worker that has done the last
   // wish.
-  ThumbnailLoader(unsigned workers, std::function<void()> wake, Load load = LoadThumbnail, void (*idle)() = KeepThumbnailRecords);
+  ThumbnailLoader(unsigned atOnce, std::function<void()> wake, Load load = LoadThumbnail, void (*idle)() = KeepThumbnailRecords);
   // Waits for what is in work.
-  ~ThumbnailLoader();
+  ~ThumbnailLoader() = default;
   ThumbnailLoader(const ThumbnailLoader&) = delete;
   ThumbnailLoader& operator=(const ThumbnailLoader&) = delete;
 
@@ -41,22 +40,21 @@ class ThumbnailLoader {
   size_t Pending() const;
 
  private:
-  void Work();
+  LatestWork::Piece Next();
+  void LoadOne(ThumbnailWish wish);
 
   const std::function<void()> wake_;
   const Load load_;
   void (*const idle_)();
   mutable std::mutex mutex_;
-  std::condition_variable wanted_;
   std::vector<ThumbnailWish> wishes_;  // the most urgent last
-  std::vector<ThumbnailWish> inWork_;  // one a worker
+  std::vector<ThumbnailWish> inWork_;  // one a thread
   std::vector<Result> results_;
-  bool stop_ = false;
-  std::vector<std::thread> workers_;
+  LatestWork work_;  // last: it uses the rest
 };
 
-// How many workers a program should have that keeps a core for its windows.
-unsigned WorkerCount();
+// How many thumbnails to load at a time, so that a core is left for the windows.
+unsigned ThumbnailsAtOnce();
 
 // The thumbnails that were loaded, up to a number of bytes; the one that was not asked for the longest goes first.
 class ThumbnailCache {

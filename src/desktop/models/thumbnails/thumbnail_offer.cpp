@@ -1,9 +1,10 @@
 #include "desktop/models/thumbnails/thumbnail_offer.h"
 
-#include <thread>
-
+#include "core/workers/background_task.h"
+#include "core/workers/folder_scope.h"
+#include "core/workers/guarded.h"
+#include "core/workers/share_out.h"
 #include "desktop/models/thumbnails/thumbnail.h"
-#include "desktop/models/thumbnails/thumbnail_loader.h"
 #include "platform/paths.h"
 
 namespace fotomill::desktop {
@@ -23,18 +24,16 @@ class ThumbnailOffer::Face : public ThumbnailUpdateFace {
     return offer_.stop_ ? 0 : offer_.answer_;
   }
   int32_t BuildThumbnails(const std::vector<std::string>& files) override {
-    std::atomic<size_t> next{0}, finished{0};
+    std::atomic<size_t> finished{0};
     std::atomic<int32_t> made{0};
-    const auto work = [&] {
-      for (size_t i = next++; i < files.size() && !offer_.stop_; i = next++) {
-        if (WriteThumbnail(platform::JoinFolder(folder_, files[i]), options_) == Status::Ok) ++made;
-        offer_.events_.building(++finished, files.size());
-      }
-    };
-    std::vector<std::thread> workers;
-    for (unsigned i = 1; i < WorkerCount(); ++i) workers.emplace_back(work);
-    work();
-    for (std::thread& worker : workers) worker.join();
+    (void)ShareOut(static_cast<int32_t>(files.size()), [&](int32_t i) {
+      if (offer_.stop_) return Status::FunctionCancelled;
+      const std::string path = platform::JoinFolder(folder_, files[static_cast<size_t>(i)]);
+      const FolderScope folder(path);
+      if (Guarded([&] { return WriteThumbnail(path, options_); }) == Status::Ok) ++made;
+      offer_.events_.building(++finished, files.size());
+      return Status::Ok;
+    });
     changed = made > 0;
     return made;
   }
@@ -50,7 +49,9 @@ class ThumbnailOffer::Face : public ThumbnailUpdateFace {
 std::shared_ptr<ThumbnailOffer> ThumbnailOffer::Start(ThumbnailBrowser browser, Events events) {
   auto offer = std::make_shared<ThumbnailOffer>();
   offer->events_ = std::move(events);
-  std::thread([offer, browser = std::move(browser)]() mutable { offer->Run(std::move(browser)); }).detach();
+  (void)RunLoose([offer, browser = std::move(browser)] {
+    if (Guarded([&] { offer->Run(browser); }) != Status::Ok && !offer->stop_) offer->events_.ended(true, browser);
+  });
   return offer;
 }
 

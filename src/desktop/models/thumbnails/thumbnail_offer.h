@@ -12,11 +12,11 @@
 
 namespace fotomill::desktop {
 
-// The offer to make missing thumbnail files of one folder, on a thread of its own: it looks for them, asks, waits for the
-// answer as long as it takes, and makes them on all cores but one.
+// The offer to make missing thumbnail files of one folder, apart: it looks for them, asks, waits for the answer as long as it
+// takes, and makes them on all cores that nobody else wants.
 class ThumbnailOffer : public std::enable_shared_from_this<ThumbnailOffer> {
  public:
-  // Called on the offer's thread.
+  // Called apart.
   struct Events {
     std::function<void(int32_t count, int32_t selected)> ask;
     std::function<void(const ThumbnailUpdateOptions& options)> keep;  // the choice, for later offers

@@ -36,9 +36,9 @@ std::string OutcomeText(Compacted result, int32_t before, int32_t after, uint64_
          " The database stays as it was. Is the disk full, or the folder protected?";
 }
 
-void CollectOrphans(const std::string& folder, int depth, const std::atomic<bool>& stop, std::vector<std::string>& orphans) {
+void CollectOrphans(const std::string& folder, int depth, const StopToken& stop, std::vector<std::string>& orphans) {
   const auto entries = platform::ListFolder(folder);
-  if (!entries || stop || platform::VolumeOf(folder).kind == platform::DriveKind::Optical) return;
+  if (!entries || stop.Asked() || platform::VolumeOf(folder).kind == platform::DriveKind::Optical) return;
   std::vector<std::string> pictures;
   for (const platform::FolderEntry& entry : *entries) {
     if (entry.kind == platform::FileKind::Regular && FindFormatByName(entry.name) != kNoFormat) pictures.push_back(entry.name);
@@ -46,18 +46,25 @@ void CollectOrphans(const std::string& folder, int depth, const std::atomic<bool
   if (const auto found = OrphanThumbnails(folder, pictures)) orphans.insert(orphans.end(), found->begin(), found->end());
   for (const platform::FolderEntry& entry : *entries) {
     const bool goDown = depth > 0 && entry.kind == platform::FileKind::Folder && !entry.link && !entry.name.starts_with('.');
-    if (goDown && !stop) CollectOrphans(platform::JoinFolder(folder, entry.name), depth - 1, stop, orphans);
+    if (goDown && !stop.Asked()) CollectOrphans(platform::JoinFolder(folder, entry.name), depth - 1, stop, orphans);
   }
 }
 
 }  // namespace
 
 DatabaseCompaction::DatabaseCompaction(std::string path, bool purge, bool hidden)
-    : path_(std::move(path)), hidden_(hidden), thread_([this, purge] { Run(purge); }) {}
-
-DatabaseCompaction::~DatabaseCompaction() {
-  Stop();
-  thread_.join();
+    : path_(std::move(path)), hidden_(hidden) {
+  const auto ended = [this](Status status) {
+    if (status != Status::Ok) outcome_ = StatusMessage(status);
+    ended_ = true;
+  };
+  task_.Start(
+      Lane::Blocking,
+      [this, purge](const StopToken& stop) {
+        Run(purge, stop);
+        return Status::Ok;
+      },
+      ended);
 }
 
 void DatabaseCompaction::Step(int32_t done, int32_t total) {
@@ -65,19 +72,18 @@ void DatabaseCompaction::Step(int32_t done, int32_t total) {
   done_ = done;
 }
 
-void DatabaseCompaction::Run(bool purge) {
+void DatabaseCompaction::Run(bool purge, const StopToken& stop) {
   ThumbnailDatabase database;
   DatabaseHeader before, after;
   if (database.OpenThumbnailDatabase(path_, false, hidden_) != Opened::Done || !database.ReadDatabaseHeader(before)) {
     outcome_ = platform::FileExists(path_) ? kNoDatabase : "There is no thumbnail database of that name.";
   } else {
     const uint64_t size = platform::FactsOf(path_).size;
-    const Compacted result = database.CompactThumbnailDatabase(purge, this, &stop_);
+    const Compacted result = database.CompactThumbnailDatabase(purge, this, stop);
     succeeded_ = result == Compacted::Done && database.ReadDatabaseHeader(after);
     const uint64_t now = platform::FactsOf(path_).size;
     outcome_ = OutcomeText(result, before.count, after.count, size > now ? size - now : 0);
   }
-  ended_ = true;
 }
 
 std::string DescribeDatabase(const std::string& path) {
@@ -90,7 +96,7 @@ std::string DescribeDatabase(const std::string& path) {
          SizeText(platform::FactsOf(path).size, choice::kSizeFitting);
 }
 
-std::vector<std::string> FindOrphanThumbnails(const std::string& folder, bool below, const std::atomic<bool>& stop) {
+std::vector<std::string> FindOrphanThumbnails(const std::string& folder, bool below, const StopToken& stop) {
   std::vector<std::string> orphans;
   CollectOrphans(folder, below ? kDeepest : 0, stop, orphans);
   return orphans;

@@ -2,6 +2,8 @@
 
 #include <algorithm>
 
+#include "core/workers/folder_scope.h"
+#include "core/workers/guarded.h"
 #include "registry/registry.h"
 
 namespace fotomill::desktop {
@@ -35,15 +37,13 @@ Status CopyFrame(const PictureRecord& facts, const Canvas& canvas, PicturePointe
 }  // namespace
 
 AnimationFrames::AnimationFrames(ViewWish wish, uint64_t capacity, std::function<void()> wake)
-    : capacity_(capacity), wake_(std::move(wake)), wish_(std::move(wish)), worker_([this] { Work(); }) {}
+    : capacity_(capacity), wake_(std::move(wake)), wish_(std::move(wish)), work_(Lane::Urgent, 1, [this] { return Next(); }) {
+  work_.Look();
+}
 
 AnimationFrames::~AnimationFrames() {
-  {
-    const std::lock_guard lock(mutex_);
-    stop_ = true;
-  }
-  wanted_.notify_all();
-  worker_.join();
+  const std::lock_guard lock(mutex_);
+  stop_ = true;
 }
 
 size_t AnimationFrames::Count() const {
@@ -75,7 +75,7 @@ void AnimationFrames::Want(size_t frame) {
       if (!Keeps(i)) frames_[i].reset();
     }
   }
-  wanted_.notify_all();
+  work_.Look();
 }
 
 ViewPicturePointer AnimationFrames::Find(size_t frame) const {
@@ -89,7 +89,7 @@ void AnimationFrames::Fit(int32_t width, int32_t height) {
     wish_.fitWidth = width;
     wish_.fitHeight = height;
   }
-  wanted_.notify_all();
+  work_.Look();
 }
 
 // How many frames may be kept: the one that is shown and the next one in any case.
@@ -126,30 +126,30 @@ bool AnimationFrames::NextFrame(size_t& frame) const {
   return Room() == count && first([&](size_t i) { return !IsFitted(i); });
 }
 
-Status AnimationFrames::Open(PicturePointer& facts, AnimationPointer& animation) {
-  RETURN_IF_BAD(LoadPictureInfo(wish_.path.c_str(), facts));
-  if (EstimateImageBytes(facts->width, facts->height, 32) > kMostCanvasBytes) return Status::MemoryAllocationError;
-  return OpenAnimation(wish_.path.c_str(), animation);
+Status AnimationFrames::OpenFile() {
+  RETURN_IF_BAD(LoadPictureInfo(wish_.path.c_str(), facts_));
+  if (EstimateImageBytes(facts_->width, facts_->height, 32) > kMostCanvasBytes) return Status::MemoryAllocationError;
+  return OpenAnimation(wish_.path.c_str(), animation_);
 }
 
-// Composes frames from `position`, the next one of the animation, up to the wanted one. Null when it cannot be had; the frames
-// then end at `position`.
-ViewPicturePointer AnimationFrames::Decode(size_t frame, const PictureRecord& facts, Animation& animation, size_t& position) {
+// Composes frames from `position_`, the next one of the animation, up to the wanted one. Null when it cannot be had; the frames
+// then end at `position_`.
+ViewPicturePointer AnimationFrames::Decode(size_t frame) {
   ViewWish wish;
-  if (frame < position) {
-    animation.Rewind();
-    position = 0;
+  if (frame < position_) {
+    animation_->Rewind();
+    position_ = 0;
   }
   Status status = Status::Ok;
-  for (; position <= frame; ++position) {
-    status = animation.Next();
+  for (; position_ <= frame; ++position_) {
+    status = animation_->Next();
     const std::lock_guard lock(mutex_);
     wish = wish_;
     if (status != Status::Ok) failure_ = status;
     if (status != Status::Ok || stop_) return nullptr;
   }
   PicturePointer picture;
-  status = CopyFrame(facts, animation.Frame(), picture);
+  status = CopyFrame(*facts_, animation_->Frame(), picture);
   auto view = std::make_shared<ViewPicture>();
   view->wish = wish;
   if (status == Status::Ok) status = PrepareView(std::move(picture), *view);
@@ -157,7 +157,7 @@ ViewPicturePointer AnimationFrames::Decode(size_t frame, const PictureRecord& fa
     view->picture->metadata = {};  // the same for each frame
     return view;
   }
-  position = frame;
+  position_ = frame;
   const std::lock_guard lock(mutex_);
   failure_ = status;
   return nullptr;
@@ -168,36 +168,48 @@ void AnimationFrames::Take(size_t frame, ViewPicturePointer picture) {
   if (Keeps(frame) || frame == shown_) frames_[frame] = std::move(picture);
 }
 
-void AnimationFrames::Work() {
-  PicturePointer facts;
-  AnimationPointer animation;
-  size_t position = 0;
-  const Status opened = Open(facts, animation);
-  std::unique_lock lock(mutex_);
-  failure_ = opened;
-  if (opened == Status::Ok) {
-    delaysMs_ = animation->Delays();
-    rounds_ = animation->Rounds();
-    frames_.resize(delaysMs_.size());
+LatestWork::Piece AnimationFrames::Next() {
+  const std::lock_guard lock(mutex_);
+  if (!opened_) return [this] { Open(); };
+  size_t frame = 0;
+  if (stop_ || !NextFrame(frame)) return {};
+  return [this, frame] { MakeFrame(frame); };
+}
+
+void AnimationFrames::Open() {
+  const Status opened = Guarded([this] {
+    const FolderScope folder(wish_.path);
+    return OpenFile();
+  });
+  {
+    const std::lock_guard lock(mutex_);
+    opened_ = true;
+    failure_ = opened;
+    if (opened == Status::Ok) {
+      delaysMs_ = animation_->Delays();
+      rounds_ = animation_->Rounds();
+      frames_.resize(delaysMs_.size());
+    }
   }
-  while (!stop_) {
-    lock.unlock();
-    wake_();
-    lock.lock();
-    size_t frame = 0;
-    wanted_.wait(lock, [&] { return stop_ || NextFrame(frame); });
-    if (stop_) return;
-    lock.unlock();
-    ViewPicturePointer picture = Decode(frame, *facts, *animation, position);
-    lock.lock();
+  wake_();
+}
+
+void AnimationFrames::MakeFrame(size_t frame) {
+  ViewPicturePointer picture;
+  const Status status = Guarded([&] { picture = Decode(frame); });
+  {
+    const std::lock_guard lock(mutex_);
+    if (status != Status::Ok) failure_ = status;
     if (picture != nullptr) {
       Take(frame, std::move(picture));
     } else if (!stop_) {  // what is behind cannot be reached either
-      delaysMs_.resize(position);
-      frames_.resize(position);
-      shown_ = std::min(shown_, position == 0 ? 0 : position - 1);
+      position_ = std::min(position_, frame);
+      delaysMs_.resize(position_);
+      frames_.resize(position_);
+      shown_ = std::min(shown_, position_ == 0 ? 0 : position_ - 1);
     }
   }
+  wake_();
 }
 
 }  // namespace fotomill::desktop

@@ -1,23 +1,22 @@
 #pragma once
 
-#include <condition_variable>
 #include <cstdint>
 #include <functional>
 #include <mutex>
-#include <thread>
 #include <vector>
 
 #include "core/status.h"
+#include "core/workers/latest_work.h"
 #include "desktop/models/view/view_picture.h"
 #include "picture/animation.h"
 
 namespace fotomill::desktop {
 
-// Decodes the frames of an animation on a thread of its own. All of them are kept when they fit into a number of bytes; else
+// Decodes the frames of an animation apart. All of them are kept when they fit into a number of bytes; else
 // as many around the one that is shown as do, and they are decoded again in each round.
 class AnimationFrames {
  public:
-  // `wake` is called on the thread whenever the file was opened, a frame came or one could not be decoded.
+  // `wake` is called on a thread of the pool whenever the file was opened, a frame came or one could not be decoded.
   AnimationFrames(ViewWish wish, uint64_t capacity, std::function<void()> wake);
   ~AnimationFrames();
   AnimationFrames(const AnimationFrames&) = delete;
@@ -38,19 +37,20 @@ class AnimationFrames {
   void Fit(int32_t width, int32_t height);
 
  private:
-  void Work();
-  Status Open(PicturePointer& facts, AnimationPointer& animation);
+  LatestWork::Piece Next();
+  void Open();
+  Status OpenFile();
+  void MakeFrame(size_t frame);
   bool NextFrame(size_t& frame) const;
   bool Keeps(size_t frame) const;
   bool IsFitted(size_t frame) const;
-  ViewPicturePointer Decode(size_t frame, const PictureRecord& facts, Animation& animation, size_t& position);
+  ViewPicturePointer Decode(size_t frame);
   void Take(size_t frame, ViewPicturePointer picture);
   size_t Room() const;
 
   const uint64_t capacity_;
   const std::function<void()> wake_;
   mutable std::mutex mutex_;
-  std::condition_variable wanted_;
   ViewWish wish_;
   std::vector<int32_t> delaysMs_;
   int32_t rounds_ = 1;
@@ -58,8 +58,13 @@ class AnimationFrames {
   std::vector<ViewPicturePointer> frames_;  // as many as delays; null where none is kept
   uint64_t frameBytes_ = 0;                 // of the largest so far
   size_t shown_ = 0;
+  bool opened_ = false;                     // or tried to
   bool stop_ = false;
-  std::thread worker_;
+  // Of the piece of work that goes on.
+  PicturePointer facts_;
+  AnimationPointer animation_;
+  size_t position_ = 0;  // the next frame of the animation
+  LatestWork work_;      // last: it uses the rest
 };
 
 }  // namespace fotomill::desktop

@@ -4,6 +4,8 @@
 #include <cmath>
 
 #include "core/choice_lists.h"
+#include "core/workers/folder_scope.h"
+#include "core/workers/guarded.h"
 #include "desktop/models/browser/browser_model.h"
 #include "desktop/models/view/photo_facts.h"
 #include "desktop/models/view/view_transform.h"
@@ -106,8 +108,11 @@ ViewPicturePointer LoadViewPicture(const ViewWish& wish) {
   const double start = platform::MonotonicSeconds();
   auto view = std::make_shared<ViewPicture>();
   view->wish = wish;
-  view->facts = platform::FactsOf(wish.path);
-  view->status = LoadInto(wish, *view);
+  view->status = Guarded([&] {
+    const FolderScope folder(wish.path);
+    view->facts = platform::FactsOf(wish.path);
+    return LoadInto(wish, *view);
+  });
   view->seconds = platform::MonotonicSeconds() - start;
   return view;
 }
@@ -137,16 +142,7 @@ ViewPicturePointer TurnedView(const ViewPicture& view, Orientation turn) {
 }
 
 ViewLoader::ViewLoader(uint64_t capacity, std::function<void()> wake)
-    : capacity_(capacity), wake_(std::move(wake)), worker_([this] { Work(); }) {}
-
-ViewLoader::~ViewLoader() {
-  {
-    const std::lock_guard lock(mutex_);
-    stop_ = true;
-  }
-  wanted_.notify_all();
-  worker_.join();
-}
+    : capacity_(capacity), wake_(std::move(wake)), work_(Lane::Urgent, 1, [this] { return Next(); }) {}
 
 void ViewLoader::Want(std::vector<ViewWish> wishes) {
   {
@@ -155,7 +151,7 @@ void ViewLoader::Want(std::vector<ViewWish> wishes) {
     full_ = false;
     DropUnwanted();
   }
-  wanted_.notify_all();
+  work_.Look();
 }
 
 ViewPicturePointer ViewLoader::Find(const ViewWish& wish) const {
@@ -202,33 +198,25 @@ void ViewLoader::DropUnwanted() {
   pictures_ = std::move(kept);
 }
 
-void ViewLoader::Work() {
-  std::unique_lock lock(mutex_);
+LatestWork::Piece ViewLoader::Next() {
+  const std::lock_guard lock(mutex_);
   ViewWish wish;
-  while (true) {
-    wanted_.wait(lock, [&] { return stop_ || NextWish(wish); });
-    if (stop_) return;
-    lock.unlock();
-    ViewPicturePointer picture = LoadViewPicture(wish);
-    lock.lock();
-    pictures_.push_back(std::move(picture));
-    DropUnwanted();
-    lock.unlock();
-    wake_();
-    lock.lock();
-  }
+  if (!NextWish(wish)) return {};
+  return [this, wish = std::move(wish)] { Decode(wish); };
 }
 
-ViewScaler::ViewScaler(std::function<void()> wake) : wake_(std::move(wake)), worker_([this] { Work(); }) {}
-
-ViewScaler::~ViewScaler() {
+void ViewLoader::Decode(const ViewWish& wish) {
+  ViewPicturePointer picture = LoadViewPicture(wish);
   {
     const std::lock_guard lock(mutex_);
-    stop_ = true;
+    pictures_.push_back(std::move(picture));
+    DropUnwanted();
   }
-  requested_.notify_all();
-  worker_.join();
+  wake_();
 }
+
+ViewScaler::ViewScaler(std::function<void()> wake)
+    : wake_(std::move(wake)), work_(Lane::Urgent, 1, [this] { return Next(); }) {}
 
 void ViewScaler::Request(ViewPicturePointer picture, int32_t width, int32_t height) {
   {
@@ -237,7 +225,7 @@ void ViewScaler::Request(ViewPicturePointer picture, int32_t width, int32_t heig
     width_ = width;
     height_ = height;
   }
-  requested_.notify_all();
+  work_.Look();
 }
 
 std::unique_ptr<ViewScaler::Scaled> ViewScaler::Take() {
@@ -245,23 +233,22 @@ std::unique_ptr<ViewScaler::Scaled> ViewScaler::Take() {
   return std::move(finished_);
 }
 
-void ViewScaler::Work() {
-  std::unique_lock lock(mutex_);
-  while (true) {
-    requested_.wait(lock, [this] { return stop_ || request_ != nullptr; });
-    if (stop_) return;
-    auto scaled = std::make_unique<Scaled>();
-    scaled->picture = std::exchange(request_, nullptr);
-    const int32_t width = width_, height = height_;
-    lock.unlock();
-    const Status status = Shrink(*scaled->picture->picture, width, height, scaled->pixels);
-    lock.lock();
-    if (status != Status::Ok || request_ != nullptr) continue;
+LatestWork::Piece ViewScaler::Next() {
+  const std::lock_guard lock(mutex_);
+  if (request_ == nullptr) return {};
+  return [this, picture = std::exchange(request_, nullptr), width = width_, height = height_] { Scale(picture, width, height); };
+}
+
+void ViewScaler::Scale(ViewPicturePointer picture, int32_t width, int32_t height) {
+  auto scaled = std::make_unique<Scaled>();
+  scaled->picture = std::move(picture);
+  const Status status = Shrink(*scaled->picture->picture, width, height, scaled->pixels);
+  {
+    const std::lock_guard lock(mutex_);
+    if (status != Status::Ok || request_ != nullptr) return;
     finished_ = std::move(scaled);
-    lock.unlock();
-    wake_();
-    lock.lock();
   }
+  wake_();
 }
 
 }  // namespace fotomill::desktop

@@ -1,14 +1,13 @@
 #pragma once
 
-#include <condition_variable>
 #include <functional>
 #include <memory>
 #include <mutex>
 #include <string>
-#include <thread>
 #include <vector>
 
 #include "core/status.h"
+#include "core/workers/latest_work.h"
 #include "desktop/models/drawing/rgb_image.h"
 #include "picture/picture_record.h"
 #include "platform/files.h"
@@ -76,12 +75,12 @@ ViewPicturePointer LoadViewPicture(const ViewWish& wish);
 // A turned copy of a picture that was loaded; null where there is no memory for it.
 ViewPicturePointer TurnedView(const ViewPicture& view, Orientation turn);
 
-// Decodes pictures ahead on a thread of its own, and keeps those that are wanted up to a number of bytes.
+// Decodes pictures ahead, apart, and keeps those that are wanted up to a number of bytes.
 class ViewLoader {
  public:
-  // `wake` is called on the loader's thread whenever a wanted picture is there.
+  // `wake` is called on a thread of the pool whenever a wanted picture is there.
   ViewLoader(uint64_t capacity, std::function<void()> wake);
-  ~ViewLoader();
+  ~ViewLoader() = default;  // waits for the picture that is decoded
   ViewLoader(const ViewLoader&) = delete;
   ViewLoader& operator=(const ViewLoader&) = delete;
 
@@ -94,26 +93,25 @@ class ViewLoader {
   void Forget(const std::string& path);
 
  private:
-  void Work();
+  LatestWork::Piece Next();
+  void Decode(const ViewWish& wish);
   bool NextWish(ViewWish& wish);
   void DropUnwanted();
 
   const uint64_t capacity_;
   const std::function<void()> wake_;
   mutable std::mutex mutex_;
-  std::condition_variable wanted_;
   std::vector<ViewWish> wishes_;
   std::vector<ViewPicturePointer> pictures_;
   bool full_ = false;
-  bool stop_ = false;
-  std::thread worker_;
+  LatestWork work_;  // last: it uses the rest
 };
 
-// Scales pictures on a thread of its own; only the latest request counts.
+// Scales pictures apart; only the latest request counts.
 class ViewScaler {
  public:
   explicit ViewScaler(std::function<void()> wake);
-  ~ViewScaler();
+  ~ViewScaler() = default;
   ViewScaler(const ViewScaler&) = delete;
   ViewScaler& operator=(const ViewScaler&) = delete;
 
@@ -127,16 +125,15 @@ class ViewScaler {
   std::unique_ptr<Scaled> Take();
 
  private:
-  void Work();
+  LatestWork::Piece Next();
+  void Scale(ViewPicturePointer picture, int32_t width, int32_t height);
 
   const std::function<void()> wake_;
   std::mutex mutex_;
-  std::condition_variable requested_;
   ViewPicturePointer request_;
   int32_t width_ = 0, height_ = 0;
   std::unique_ptr<Scaled> finished_;
-  bool stop_ = false;
-  std::thread worker_;
+  LatestWork work_;  // last: it uses the rest
 };
 
 }  // namespace fotomill::desktop

@@ -94,7 +94,7 @@ void CrumbStrip::LayOut() {
 }
 
 void CrumbStrip::ListBelow(size_t place) {
-  listing_.Start([this, place, folder = places_[place].crumb.folder](const std::atomic<bool>&, const LooseWork::Tell& tell) {
+  listing_.Start([this, place, folder = places_[place].crumb.folder](const StopToken&, const LooseWork::Tell& tell) {
     tell([this, place, names = SubfolderNames(folder)] { OfferBelow(place, names); });
   });
 }

@@ -10,7 +10,7 @@ constexpr size_t kBunch = 200;
 
 void FolderReader::List(const std::string& folder, bool namesFirst) {
   facts_.Stop();
-  listing_.Start([this, folder, namesFirst](const std::atomic<bool>& stop, const LooseWork::Tell& tell) {
+  listing_.Start([this, folder, namesFirst](const StopToken& stop, const LooseWork::Tell& tell) {
     const auto send = [&](FolderListing listing, bool complete) {
       tell([this, listing = std::move(listing), complete]() mutable {
         if (complete) listing_.Stop();
@@ -18,14 +18,17 @@ void FolderReader::List(const std::string& folder, bool namesFirst) {
       });
     };
     FolderListing listing = ListForBrowser(folder, false, stop);
-    if (namesFirst && !stop) send(listing, false);
+    if (namesFirst && !stop.Asked()) send(listing, false);
     AddFacts(folder, listing, stop);
-    if (!stop) send(std::move(listing), true);
+    if (!stop.Asked()) send(std::move(listing), true);
+  }, [this] {
+    listing_.Stop();
+    events_.listed({}, true);  // as a folder that cannot be read
   });
 }
 
 void FolderReader::ReadFacts(const std::string& folder, PlacedItems wanted) {
-  facts_.Start([this, folder, wanted = std::move(wanted)](const std::atomic<bool>& stop, const LooseWork::Tell& tell) {
+  facts_.Start([this, folder, wanted = std::move(wanted)](const StopToken& stop, const LooseWork::Tell& tell) {
     const auto send = [&](PlacedItems found, bool last) {
       tell([this, found = std::move(found), last] {
         if (last) facts_.Stop();
@@ -34,13 +37,16 @@ void FolderReader::ReadFacts(const std::string& folder, PlacedItems wanted) {
     };
     PlacedItems found;
     for (const auto& [place, item] : wanted) {
-      if (stop) return;
+      if (stop.Asked()) return;
       FolderItem facts = item;
       AddPictureFacts(folder, facts);
       if (facts.width > 0) found.emplace_back(place, std::move(facts));
       if (found.size() == kBunch) send(std::exchange(found, {}), false);
     }
     send(std::move(found), true);
+  }, [this] {
+    facts_.Stop();
+    events_.factsFound({}, true);
   });
 }
 

@@ -5,8 +5,8 @@
 #include <wx/textdlg.h>
 
 #include <algorithm>
-#include <thread>
 
+#include "core/workers/background_task.h"
 #include "desktop/models/browser/folder_listing.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/widgets/bitmaps.h"
@@ -155,14 +155,14 @@ void FolderTree::Reread() {
 }
 
 void FolderTree::Read(std::vector<std::string> folders) {
-  std::thread([this, alive = std::weak_ptr(alive_), folders = std::move(folders)] {
+  (void)RunLoose([this, alive = std::weak_ptr(alive_), folders = std::move(folders)] {
     for (const std::string& folder : folders) {
       if (alive.expired()) return;
       wxTheApp->CallAfter([this, alive, folder, names = SubfolderNames(folder)] {
         if (!alive.expired()) ShowNames(folder, names);
       });
     }
-  }).detach();
+  });
 }
 
 void FolderTree::ShowNames(const std::string& folder, const std::vector<std::string>& names) {

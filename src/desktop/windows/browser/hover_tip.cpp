@@ -34,7 +34,7 @@ void HoverTip::Over(const std::string& folder, const FolderItem* item, Status kn
 }
 
 void HoverTip::Read() {
-  reading_.Start([this, folder = folder_, item = item_, known = known_](const std::atomic<bool>&, const LooseWork::Tell& tell) {
+  reading_.Start([this, folder = folder_, item = item_, known = known_](const StopToken&, const LooseWork::Tell& tell) {
     tell([this, lines = FileTipLines(folder, item, known)] {
       wxString text;
       for (const std::string& line : lines) text += (text.empty() ? "" : "\n") + Shown(line);

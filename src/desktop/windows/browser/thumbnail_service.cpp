@@ -10,7 +10,7 @@ constexpr uint64_t kCacheBytes = 256ull * 1024 * 1024;
 
 ThumbnailService::ThumbnailService()
     : cache_(kCacheBytes),
-      loader_(std::make_unique<ThumbnailLoader>(WorkerCount(), [this] { CallAfter([this] { TakeResults(); }); })) {}
+      loader_(std::make_unique<ThumbnailLoader>(ThumbnailsAtOnce(), [this] { CallAfter([this] { TakeResults(); }); })) {}
 
 ThumbnailService::~ThumbnailService() {
   loader_.reset();  // before its events' handler goes

@@ -138,10 +138,10 @@ void CleanUpBox::Search() {
   list_->Clear();
   work_.Start(
       *this,
-      [this, below = below_->GetValue()](const std::atomic<bool>& stop) {
+      [this, below = below_->GetValue()](const StopToken& stop) {
         orphans_ = FindOrphanThumbnails(folder_, below, stop);
       },
-      [this] { Found(); });
+      [this](Status) { Found(); });  // as many as there was memory for
 }
 
 void CleanUpBox::Found() {

@@ -9,6 +9,7 @@
 #include <wx/textdlg.h>
 
 #include <algorithm>
+#include <memory>
 
 #include "core/plain_name.h"
 #include "desktop/models/files/pasted_picture.h"
@@ -48,24 +49,22 @@ std::string Count(size_t files) { return files == 1 ? std::string("1 file") : st
 
 FileActions::FileActions(Shell& shell) : shell_(shell), undo_(static_cast<size_t>(std::clamp(settings.UndoLevels, 1, 1000))) {}
 
-FileActions::~FileActions() {
-  stop_ = true;
-  if (thread_.joinable()) thread_.join();
-}
-
 void FileActions::Run(const std::string& what, Work work, Then then) {
   if (busy_) return shell_.Report("Wait until the files before are done.");
-  if (thread_.joinable()) thread_.join();
   busy_ = true;
-  stop_ = false;
-  thread_ = std::thread([this, what, work = std::move(work), then = std::move(then)] {
-    DeedResult result = work([this, &what](size_t index, size_t count) {
+  const auto result = std::make_shared<DeedResult>();
+  const auto run = [this, what, work = std::move(work), result](const StopToken& stop) {
+    *result = work([this, &what, &stop](size_t index, size_t count) {
       CallAfter([this, what, index, count] {
         if (count > 1) shell_.Report(what + ": " + std::to_string(index + 1) + " of " + std::to_string(count));
       });
-      return !stop_;
+      return !stop.Asked();
     });
-    CallAfter([this, what, result = std::move(result), then]() mutable { Finished(what, std::move(result), then); });
+    return Status::Ok;
+  };
+  task_.Start(Lane::Blocking, run, [this, what, result, then = std::move(then)](Status status) {
+    if (status != Status::Ok) result->failures.push_back({what, std::string(StatusMessage(status))});
+    CallAfter([this, what, result, then] { Finished(what, std::move(*result), then); });
   });
 }
 

@@ -2,12 +2,11 @@
 
 #include <wx/event.h>
 
-#include <atomic>
 #include <functional>
 #include <string>
-#include <thread>
 #include <vector>
 
+#include "core/workers/background_task.h"
 #include "desktop/models/browser/file_deeds.h"
 #include "processing/geometry/orient.h"
 
@@ -15,12 +14,12 @@ namespace fotomill::desktop {
 
 class Shell;
 
-// What the frame does to files: on a thread of its own, one thing after the other, told of in the status bar, and kept so
+// What the frame does to files: apart, one thing after the other, told of in the status bar, and kept so
 // that it can be taken back.
 class FileActions : public wxEvtHandler {
  public:
   explicit FileActions(Shell& shell);
-  ~FileActions() override;
+  ~FileActions() override = default;
 
   // False when the user was asked and does not want it, where there is no trash.
   bool Trash(const std::vector<std::string>& paths);
@@ -48,7 +47,7 @@ class FileActions : public wxEvtHandler {
   void NoteDone(FileDeed deed) { undo_.Add(std::move(deed)); }
   const UndoList& Undoable() const { return undo_; }
   bool Busy() const { return busy_; }
-  void Stop() { stop_ = true; }
+  void Stop() { task_.Stop(); }
 
   // The clipboard holds the files for other programs too; `cut` asks whoever pastes to move them.
   void ToClipboard(const std::vector<std::string>& paths, bool cut);
@@ -69,9 +68,8 @@ class FileActions : public wxEvtHandler {
 
   Shell& shell_;
   UndoList undo_;
-  std::thread thread_;
-  std::atomic<bool> stop_{false};
   bool busy_ = false;
+  BackgroundTask task_;  // last: it uses the rest
 };
 
 // Functions of the frame's menu.

@@ -67,8 +67,11 @@ ExifFrame::ExifFrame(wxWindow* parent, const std::string& path)
   list_->SetFocus();
   work_.Start(
       *this,
-      [this, options = ExifTextOptionsFromSettings()](const std::atomic<bool>&) { report_ = ReadExifReport(path_, options); },
-      [this] { Finished(); });
+      [this, options = ExifTextOptionsFromSettings()](const StopToken&) { report_ = ReadExifReport(path_, options); },
+      [this](Status status) {
+        if (status != Status::Ok) report_.problem = StatusMessage(status);
+        Finished();
+      });
 }
 
 void ExifFrame::Finished() {

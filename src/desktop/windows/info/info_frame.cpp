@@ -65,15 +65,15 @@ InfoFrame::InfoFrame(Shell& shell, wxWindow* parent, std::vector<std::string> pa
   timer_.Start(kProgressMs);
   work_.Start(
       *this,
-      [this, options = InfoOptionsFromSettings()](const std::atomic<bool>& stop) {
+      [this, options = InfoOptionsFromSettings()](const StopToken& stop) {
         for (const std::string& path : paths_) {
-          if (stop) return;
+          if (stop.Asked()) return;
           files_.push_back(ReadFileInfo(path, options));
           ++read_;
         }
         summary_ = SummaryOf(files_);
       },
-      [this] { Finished(); });
+      [this](Status) { Finished(); });  // with what could be read
 }
 
 wxSizer* InfoFrame::BuildButtons(wxWindow& panel) {

@@ -2,45 +2,43 @@
 
 #include <wx/event.h>
 
-#include <atomic>
 #include <functional>
 #include <memory>
-#include <thread>
+
+#include "core/workers/background_task.h"
 
 namespace fotomill::desktop {
 
-// Work that a window has done on a thread of its own. Goes with the window: what is in work is asked to stop and waited for.
+// Work that a window has done apart. Goes with the window: what is in work is asked to stop and waited for.
 class Background {
  public:
-  ~Background() { Stop(); }
-
-  // Runs `work` apart, and then `done` on the window's thread, unless it was stopped. Work that goes on is stopped first.
-  void Start(wxEvtHandler& window, std::function<void(const std::atomic<bool>& stop)> work, std::function<void()> done) {
+  // Runs `work` apart, and then `done` on the window's thread, unless it was stopped: with MemoryAllocationError where the work
+  // ran out of memory, Ok otherwise. Work that goes on is stopped first.
+  void Start(wxEvtHandler& window, std::function<void(const StopToken& stop)> work, std::function<void(Status)> done) {
     Stop();
-    job_ = std::make_shared<Job>();
-    job_->thread = std::thread(
-        [job = job_.get(), shared = std::weak_ptr<Job>(job_), &window, work = std::move(work), done = std::move(done)] {
-          work(job->stop);
-          if (job->stop) return;
-          window.CallAfter([shared, done] {
-            const std::shared_ptr<Job> still = shared.lock();
-            if (still != nullptr && !still->stop) done();
+    const auto wanted = std::make_shared<bool>(true);
+    wanted_ = wanted;
+    task_.Start(
+        Lane::Blocking,
+        [work = std::move(work)](const StopToken& stop) {
+          work(stop);
+          return stop.Asked() ? Status::FunctionCancelled : Status::Ok;
+        },
+        [&window, weak = std::weak_ptr(wanted), done = std::move(done)](Status status) {
+          if (status == Status::FunctionCancelled) return;
+          window.CallAfter([weak, status, done] {
+            if (!weak.expired()) done(status);
           });
         });
   }
   void Stop() {
-    if (job_ == nullptr) return;
-    job_->stop = true;
-    job_->thread.join();
-    job_.reset();
+    wanted_.reset();
+    task_.StopAndWait();
   }
 
  private:
-  struct Job {
-    std::atomic<bool> stop{false};
-    std::thread thread;
-  };
-  std::shared_ptr<Job> job_;
+  std::shared_ptr<bool> wanted_;  // belongs to the window's thread
+  BackgroundTask task_;
 };
 
 }  // namespace fotomill::desktop

@@ -2,15 +2,16 @@
 
 #include <wx/app.h>
 
-#include <atomic>
 #include <functional>
-#include <memory>
-#include <thread>
+#include <optional>
+
+#include "core/workers/background_task.h"
+#include "core/workers/guarded.h"
 
 namespace fotomill::desktop {
 
-// Work on a thread that nobody waits for, since a folder may hang: it is asked to stop, and what it tells when nobody is
-// interested any more is dropped. Goes with the window that wants its results.
+// Work that nobody waits for, since a folder may hang: it is asked to stop, and what it tells when nobody is interested any more is
+// dropped. Goes with the window that wants its results.
 class LooseWork {
  public:
   // Has something done on the window's thread, unless the work was stopped meanwhile.
@@ -21,28 +22,30 @@ class LooseWork {
   LooseWork& operator=(const LooseWork&) = delete;
   ~LooseWork() { Stop(); }
 
-  // Runs `work` apart. Work that goes on is stopped first.
-  void Start(std::function<void(const std::atomic<bool>& stop, const Tell& tell)> work) {
+  // Runs `work` apart; where it runs out of memory, `failed` on the window's thread. Work that goes on is stopped first.
+  void Start(std::function<void(const StopToken& stop, const Tell& tell)> work, std::function<void()> failed = [] {}) {
     Stop();
-    stop_ = std::make_shared<std::atomic<bool>>(false);
-    std::thread([stop = stop_, work = std::move(work)] {
-      work(*stop, [&stop](std::function<void()> action) {
-        if (*stop) return;
-        wxTheApp->CallAfter([stop, action = std::move(action)] {
-          if (!*stop) action();
-        });
+    source_.emplace();
+    const auto tell = [stop = source_->Token()](std::function<void()> action) {
+      if (stop.Asked()) return;
+      wxTheApp->CallAfter([stop, action = std::move(action)] {
+        if (!stop.Asked()) action();
       });
-    }).detach();
+    };
+    const bool begun = RunLoose([stop = source_->Token(), tell, work = std::move(work), failed] {
+      if (Guarded([&] { work(stop, tell); }) != Status::Ok) tell(failed);
+    });
+    if (!begun) tell(std::move(failed));
   }
   void Stop() {
-    if (stop_ != nullptr) *stop_ = true;
-    stop_.reset();
+    if (source_) source_->Stop();
+    source_.reset();
   }
   // Whether work was started that nobody stopped; who is told of its end stops it then.
-  bool Started() const { return stop_ != nullptr; }
+  bool Started() const { return source_.has_value(); }
 
  private:
-  std::shared_ptr<std::atomic<bool>> stop_;
+  std::optional<StopSource> source_;
 };
 
 }  // namespace fotomill::desktop

@@ -4,8 +4,8 @@
 
 #include <algorithm>
 #include <cmath>
-#include <thread>
 
+#include "core/workers/background_task.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/view/system_animations.h"
 #include "platform/clock.h"
@@ -66,7 +66,7 @@ void ViewAnimation::End() {
   shown_.reset();
   *alive_ = false;
   // Nobody waits for the frame that is being decoded.
-  std::thread([player = std::move(player_)] {}).detach();
+  (void)RunLoose([player = std::shared_ptr<AnimationPlayer>(std::move(player_))]() mutable { player.reset(); });
 }
 
 void ViewAnimation::Toggle() {
