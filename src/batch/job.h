@@ -11,6 +11,7 @@
 #include "catalog/history/file_history.h"
 #include "core/fixed_text.h"
 #include "core/status.h"
+#include "core/workers/stop_token.h"
 #include "processing/palette/reduce.h"
 #include "registry/registry.h"
 
@@ -57,6 +58,9 @@ struct SequentialRenameState {
 // NewBatchJob; by itself a job has the built-in defaults, puts nothing in front of names, and keeps nothing. Belongs to the
 // thread that runs the batch.
 struct BatchJob {
+  // Abort: set by the button of the job's own progress box, or by its owner. Functions ask its token between files; what is in
+  // work is finished, nothing new is begun. Whoever asks the program to end stops every job.
+  StopSource stop;
   PathText source;                  // the file in work
   int32_t formatIndex = kNoFormat;  // of the outputs
   std::string extension;            // of the outputs, without dot; empty: the format's own. A plug-in format's has to be

@@ -1,6 +1,5 @@
 #include "batch/progress_box.h"
 
-#include "batch/abort.h"
 #include "batch/job.h"
 
 namespace fotomill {
@@ -20,7 +19,6 @@ void ShowPlace(BatchJob& job, uint32_t index, uint32_t count) {
 }  // namespace
 
 bool OpenProgressBox(BatchJob& job) {
-  ClearAbort();
   job.errors = false;
   job.progress.Open();
   if (job.box == nullptr || job.box->Open(job.progress)) return true;

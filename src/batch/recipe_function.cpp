@@ -2,7 +2,6 @@
 
 #include <algorithm>
 
-#include "batch/abort.h"
 #include "operations/engine.h"
 #include "platform/files.h"
 
@@ -15,6 +14,7 @@ struct RecipeRun {
   std::shared_ptr<const Recipe> recipe;
   std::string copyrightHolder;
   uint32_t threads = 0;
+  StopToken stop;
 
   MacroFacts FactsOf(const std::string& source) const {
     return {.fileName = source, .copyrightHolder = copyrightHolder, .modified = platform::FactsOf(source).modified};
@@ -22,7 +22,7 @@ struct RecipeRun {
   Status Apply(PictureRecord& picture, std::span<const Step> steps) const {
     if (steps.empty()) return Status::Ok;
     return ApplySteps(picture, steps,
-                      {.work = {.threads = threads, .goesOn = [] { return !AbortAsked(); }},
+                      {.work = {.threads = threads, .goesOn = [this] { return !stop.Asked(); }},
                        .facts = FactsOf(std::string(picture.fileName.view()))});
   }
 };
@@ -50,7 +50,7 @@ FileFunction FunctionOfFamily(Family family) {
 
 std::string SetRecipe(std::shared_ptr<const Recipe> recipe, const std::string& copyrightHolder, const BatchJob& job,
                       const FormatLookup& lookup, BatchFunction& function) {
-  const auto run = std::make_shared<RecipeRun>(RecipeRun{recipe, copyrightHolder, function.jobs == 1 ? 1u : 0u});
+  const auto run = std::make_shared<RecipeRun>(RecipeRun{recipe, copyrightHolder, function.jobs == 1 ? 1u : 0u, job.stop.Token()});
   function.transform = [run](PictureRecord& picture) { return run->Apply(picture, run->recipe->common); };
   function.autoOrient = function.autoOrient || recipe->HasSteps();
   for (size_t i = 0; i < recipe->outputs.size(); ++i) {

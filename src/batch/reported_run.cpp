@@ -3,7 +3,6 @@
 #include <algorithm>
 #include <utility>
 
-#include "batch/abort.h"
 #include "core/workers/folder_scope.h"
 #include "platform/clock.h"
 #include "platform/folders.h"
@@ -15,10 +14,11 @@ ReportedRun::ReportedRun(std::span<const BatchFile> files, BatchJob& job, Way wa
     : files_(files),
       job_(job),
       way_(std::move(way)),
+      stop_(job.stop.Token()),
       outcomes_(files.size()),
       run_({.work = [this](size_t file) { return Work(file); },
             .deliver = [this](size_t file, Status status) { Deliver(file, status); },
-            .goesOn = [this] { return !ended_ && !AbortAsked(); },
+            .goesOn = [this] { return !ended_ && !stop_.Asked(); },
             .tick = [this] { Tick(); }}) {}
 
 uint32_t ReportedRun::CoreJobs() { return platform::CoreCount(); }

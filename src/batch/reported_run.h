@@ -45,6 +45,7 @@ class ReportedRun {
   const std::span<const BatchFile> files_;
   BatchJob& job_;
   const Way way_;
+  const StopToken stop_;
   std::vector<std::vector<FileOutcome>> outcomes_;  // of files that are done and not yet reported; none: given up
   std::atomic<bool> ended_{false};
   OrderedRun run_;

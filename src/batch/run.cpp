@@ -4,7 +4,6 @@
 #include <mutex>
 #include <optional>
 
-#include "batch/abort.h"
 #include "batch/destination_name.h"
 #include "batch/picture_failure.h"
 #include "batch/prompts.h"
@@ -304,7 +303,7 @@ class Batch {
   // The same when every file before this one is done.
   DestinationAnswer SettleInTurn(const std::string& source, Destination& destination, const PictureRecord& picture,
                                  bool& cancelled) {
-    cancelled = AbortAsked();
+    cancelled = job_.stop.Token().Asked();
     if (cancelled) return DestinationAnswer::Skip;
     const TakenTest taken = [&](const std::string& path) { return IsTaken(path, source); };
     const VariantMaker variant = [&](std::string& path) {

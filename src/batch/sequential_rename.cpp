@@ -4,7 +4,6 @@
 #include <numeric>
 #include <random>
 
-#include "batch/abort.h"
 #include "core/plain_name.h"
 #include "files/rename_log.h"
 #include "platform/clock.h"
@@ -151,9 +150,10 @@ void RunRename(std::span<const BatchFile> files, const RenameOptions& options, B
   RenamedFiles renamed(options.dryRun);
   RenameLog log;
   NextNumber next(job, rules.update && !options.dryRun);
+  const StopToken stop = job.stop.Token();
   uint32_t done = 0;
   for (const size_t place : order) {
-    if (AbortAsked() || (job.box != nullptr && !job.box->GoesOn())) break;
+    if (stop.Asked() || (job.box != nullptr && !job.box->GoesOn())) break;
     job.source.AssignCut(files[place].name);
     const uint32_t before = job.rename.number;
     const FileOutcome outcome = RenameOne(files[place], rules, renamed, job, options.dryRun ? nullptr : &log);
@@ -171,9 +171,10 @@ bool UndoRename(const std::set<std::string>& only, bool dryRun, BatchJob& job) {
   for (const RenamedFile& file : *log) (only.empty() || only.contains(file.to) ? wanted : left).push_back(file);
   if (!OpenProgressBox(job)) return true;
   RenamedFiles files(dryRun);
+  const StopToken stop = job.stop.Token();
   uint32_t done = 0;
   const auto count = static_cast<uint32_t>(wanted.size());
-  for (; !wanted.empty() && !AbortAsked(); wanted.pop_back()) {
+  for (; !wanted.empty() && !stop.Asked(); wanted.pop_back()) {
     const RenamedFile& file = wanted.back();
     FileOutcome outcome{.source = file.to, .destination = file.from};
     if (!files.Exists(file.to)) {

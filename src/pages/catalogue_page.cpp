@@ -6,7 +6,6 @@
 #include <utility>
 #include <vector>
 
-#include "batch/abort.h"
 #include "batch/destination_name.h"
 #include "batch/picture_failure.h"
 #include "core/text.h"
@@ -53,7 +52,7 @@ Status WritePage(PictureRecord& page, const CataloguePageOptions& options, const
 class ContactSheet {
  public:
   ContactSheet(std::span<const BatchFile> files, const ContactSheetOptions& options, BatchJob& job)
-      : files_(files), options_(options), job_(job), cells_(files.size()) {}
+      : files_(files), options_(options), job_(job), stop_(job.stop.Token()), cells_(files.size()) {}
 
   Status OpenFont() { return options_.look.names ? font_.Open(options_.fontName, kCaptionHeight) : Status::Ok; }
 
@@ -64,11 +63,11 @@ class ContactSheet {
     const uint64_t room = kBytesAhead / std::max<uint64_t>(cellBytes, 1);
     OrderedRun run({.work = [this](size_t i) { return Work(i); },
                     .deliver = [this](size_t i, Status status) { Deliver(i, status); },
-                    .goesOn = [this] { return !ended_ && !AbortAsked(); },
+                    .goesOn = [this] { return !ended_ && !stop_.Asked(); },
                     .tick = [this] { Tick(); },
                     .ahead = std::max<size_t>(std::min<uint64_t>(room, kCellsAhead), size_t{jobs} + 1)});
     run.Run(files_.size(), jobs);
-    if (ended_ || AbortAsked()) GiveUpPage();
+    if (ended_ || stop_.Asked()) GiveUpPage();
     EndPage();
   }
 
@@ -178,6 +177,7 @@ class ContactSheet {
   const std::span<const BatchFile> files_;
   const ContactSheetOptions& options_;
   BatchJob& job_;
+  const StopToken stop_;
   std::vector<std::unique_ptr<Cell>> cells_;  // done and not yet on a page
   CaptionFont font_;
   PicturePointer page_;               // the one that is being filled

@@ -3,7 +3,6 @@
 
 #include <filesystem>
 
-#include "batch/abort.h"
 #include "batch/new_job.h"
 #include "pages/catalogue_page.h"
 #include "settings/settings.h"
@@ -150,7 +149,7 @@ class AbortingBox : public ProgressBox {
   void ShowLine(const ProgressLine&, const FileOutcome*) override {}
   void ShowStatus(const std::string&) override {}
   void Tick() override {
-    if (job_.source.view() == last_) Abort();
+    if (job_.source.view() == last_) job_.stop.Stop();
   }
   void StayOpen(const ProgressModel&) override {}
   void Close(const ProgressModel&) override {}
@@ -176,7 +175,6 @@ TEST(CataloguePage, APageThatIsNotFullIsNotWrittenAfterAbort) {
     job.formatIndex = FindFormatByName("x.bmp");
     job.destinationFolder = folder.Path("out" + std::to_string(jobs));
     ASSERT_EQ(RunContactSheet(files, options, job), Status::Ok);
-    ClearAbort();
     EXPECT_EQ(job.progress.Files(), 3u);
     EXPECT_TRUE(std::filesystem::exists(job.destinationFolder + "/Catalog_00001.bmp"));
     EXPECT_FALSE(std::filesystem::exists(job.destinationFolder + "/Catalog_00002.bmp"));

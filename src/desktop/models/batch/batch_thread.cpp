@@ -1,6 +1,5 @@
 #include "desktop/models/batch/batch_thread.h"
 
-#include "batch/abort.h"
 #include "batch/new_job.h"
 #include "core/choice_lists.h"
 #include "desktop/models/browser/browser_model.h"
@@ -128,7 +127,7 @@ class BatchThread::Questions : public Prompts {
 
 BatchThread::~BatchThread() {
   if (!task_.Running()) return;
-  Abort();
+  job_.stop.Stop();
   {
     const std::lock_guard lock(mutex_);
     given_ = true;

@@ -64,6 +64,8 @@ class BatchThread {
   // Any other work that reports to a box: `work` gets the job, with box and prompts set, and returns its status.
   using Work = std::function<Status(BatchJob& job)>;
   void StartWork(BatchJob job, Work work);
+  // Asks the batch to stop; it finishes what is in work.
+  void Abort() { job_.stop.Stop(); }
   bool Running() const { return running_; }
 
  private:

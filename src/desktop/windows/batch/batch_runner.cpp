@@ -3,7 +3,6 @@
 #include <wx/msgdlg.h>
 #include <wx/textdlg.h>
 
-#include "batch/abort.h"
 #include "batch/new_job.h"
 #include "batch/turn_run.h"
 #include "desktop/models/batch/destination_choice.h"
@@ -81,7 +80,7 @@ wxWindow* BatchRunner::DialogParent() const { return box_ != nullptr ? static_ca
 
 void BatchRunner::BatchOpened() {
   ProgressWindow::Events events;
-  events.abort = [] { Abort(); };
+  events.abort = [this] { thread_->Abort(); };
   events.closed = [this](ProgressWindow& box) {
     if (box_ == &box) box_ = nullptr;
     box.Destroy();
