@@ -3,9 +3,12 @@
 #include "cli/frame/command.h"
 #include "platform/memory.h"
 #include "platform/process.h"
+#include "platform/work_apart.h"
+#include "registry/child_tasks.h"
 
 int main(int count, char** arguments) {
   using namespace fotomill;
+  if (const auto status = platform::ServeApart(count, arguments, ChildTasks())) return *status;
   platform::FillStandardStreams();
   platform::CatchTermination();
   platform::KeepFreedMemory();

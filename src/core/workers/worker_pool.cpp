@@ -6,6 +6,7 @@
 
 #include "core/workers/guarded.h"
 #include "platform/process.h"
+#include "platform/work_apart.h"
 
 namespace fotomill {
 
@@ -42,7 +43,7 @@ WorkerPool::~WorkerPool() {
 }
 
 WorkerPool& WorkerPool::Shared() {
-  static WorkerPool* const pool = std::make_unique<WorkerPool>(platform::CoreCount()).release();
+  static WorkerPool* const pool = std::make_unique<WorkerPool>(platform::CoreCount(), platform::EndIdleProcesses).release();
   return *pool;
 }
 

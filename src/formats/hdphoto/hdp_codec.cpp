@@ -139,43 +139,55 @@ SampleShape ShapeOf(const HdpStream& stream) {
   }
 }
 
-// What a decoder needs to know of its place in the raster.
+// What the process apart is asked for: the sizes of the codestreams, which are its input one behind the other, and the raster.
+struct DecodeRequest {
+  uint64_t imageSize = 0, alphaSize = 0;  // bytes; without alphaSize, alpha comes with the colors if there is any
+  uint64_t stride = 0;
+  int32_t width = 0, height = 0;
+  uint32_t samples = 0, sampleBytes = 0;
+  uint32_t alpha = 0;
+
+  uint64_t RasterBytes() const { return stride * static_cast<uint64_t>(height); }
+};
+
+// One of the codestreams, and where it goes.
 struct DecodeJob {
-  HdpStream stream;
+  std::span<const uint8_t> stream;
   uint32_t firstSample = 0;
   bool alphaToo = false;
 };
 
 // Decodes one codestream into the raster; false when it cannot. Runs apart.
-bool DecodeStream(const DecodeJob& job, HdpRaster& raster, const std::function<void(int32_t)>& tell, bool& overrun) {
+bool DecodeStream(const DecodeJob& job, const DecodeRequest& request, std::span<uint8_t> raster,
+                  const std::function<void(int32_t)>& tell, bool& overrun) {
   const JxrLibrary& library = Library();
-  JxrStream source(job.stream.bytes);
+  JxrStream source(job.stream);
   CWMImageInfo info = {};
   CWMIStrCodecParam parameters = {};
   parameters.pWStream = &source;
   parameters.uAlphaMode = job.alphaToo ? kAlphaToo : kNoAlpha;
   if (library.decodeInfo(&info, &parameters) != ICERR_OK) return false;
-  const auto width = static_cast<size_t>(job.stream.width), height = static_cast<size_t>(job.stream.height);
+  const auto width = static_cast<size_t>(request.width), height = static_cast<size_t>(request.height);
   if (info.cWidth != width || info.cHeight != height) return false;
   info.cThumbnailWidth = info.cROIWidth = width;
   info.cThumbnailHeight = info.cROIHeight = height;
   info.oOrientation = O_NONE;
   info.bRGB = FALSE;
-  info.cBitsPerUnit = raster.sampleBytes == 0 ? 1 : 8 * raster.samples * raster.sampleBytes;
+  info.cBitsPerUnit = request.sampleBytes == 0 ? 1 : 8 * request.samples * request.sampleBytes;
   info.cLeadingPadding = job.firstSample;
   CTXSTRCODEC context = nullptr;
   if (library.decodeInit(&info, &parameters, &context) != ICERR_OK || context == nullptr) return false;
   CWMImageBufferInfo buffer = {};
-  buffer.pv = raster.block.Bytes().data();
+  buffer.pv = raster.data();
   buffer.cLine = height;
-  buffer.cbStride = raster.stride;
-  const int32_t blocks = (job.stream.height + kBlock - 1) / kBlock;
+  buffer.cbStride = request.stride;
+  const int32_t blocks = (request.height + kBlock - 1) / kBlock;
   bool decoded = true;
   for (int32_t row = 0; decoded && row <= blocks; ++row) {  // each row of blocks is complete only with the next one
     size_t lines = 0;
     buffer.uiFirstMBRow = buffer.uiLastMBRow = static_cast<unsigned>(row);
     decoded = library.decode(context, &buffer, &lines) == ICERR_OK && !source.overrun;
-    tell(std::min(row * kBlock, job.stream.height));
+    tell(std::min(row * kBlock, request.height));
   }
   library.decodeTerm(context);
   overrun = source.overrun;
@@ -194,7 +206,7 @@ Status MakeRaster(const HdpPage& page, HdpRaster& raster) {
   raster.stride = (raster.stride + 127) / 128 * 128;
   constexpr uint64_t kShare = 2;  // the picture is held as well
   if (raster.stride > limits.packedBlockBytes / kShare / height) return Status::MemoryAllocationError;
-  return raster.block.Allocate(raster.stride * height) ? Status::Ok : Status::MemoryAllocationError;
+  return raster.block.Allocate(raster.stride * height + 1) ? Status::Ok : Status::MemoryAllocationError;
 }
 
 }  // namespace
@@ -208,28 +220,52 @@ Status DecodeHdp(const HdpPage& page, HdpRaster& raster, const std::function<voi
   if (page.cutShort) return Status::FileReadError;
   if (!HasHdpLibrary()) return Status::FeatureDisabled;
   RETURN_IF_BAD(MakeRaster(page, raster));
-  platform::SharedBlock overrun;
-  if (!overrun.Allocate(1)) return Status::MemoryAllocationError;
+  const DecodeRequest request = {.imageSize = page.image.bytes.size(),
+                                 .alphaSize = page.alpha.bytes.size(),
+                                 .stride = raster.stride,
+                                 .width = page.image.width,
+                                 .height = page.image.height,
+                                 .samples = raster.samples,
+                                 .sampleBytes = raster.sampleBytes,
+                                 .alpha = raster.alpha};
+  platform::MemoryBlock input;
+  if (!input.Allocate(request.imageSize + request.alphaSize, platform::Fill::Unset)) return Status::MemoryAllocationError;
+  std::ranges::copy(page.image.bytes, input.Bytes().begin());
+  std::ranges::copy(page.alpha.bytes, input.Bytes().begin() + static_cast<ptrdiff_t>(request.imageSize));
   const auto pixels = static_cast<uint64_t>(page.image.width) * static_cast<uint64_t>(page.image.height);
-  const auto work = [&](const std::function<void(int32_t)>& tell) {
-    const bool apart = !page.alpha.bytes.empty();
-    bool over = false;
-    bool done = DecodeStream({page.image, 0, raster.alpha && !apart}, raster, tell, over);
-    overrun.Bytes()[0] = over;
-    if (done && raster.alpha && apart) {
-      done = DecodeStream(
-          {page.alpha, raster.samples - 1, false}, raster, [](int32_t) {}, over);
-      overrun.Bytes()[0] |= over;
-    }
-    return done;
-  };
   const platform::ApartResult result =
-      platform::RunApart(work, kSecondsAtLeast + static_cast<unsigned>(pixels / kPixelsPerSecond), told);
+      platform::RunApart({.task = kHdpTask,
+                          .request = {reinterpret_cast<const uint8_t*>(&request), sizeof request},
+                          .input = input.Bytes(),
+                          .reply = raster.block,
+                          .seconds = kSecondsAtLeast + static_cast<unsigned>(pixels / kPixelsPerSecond)},
+                         told);
+  const bool overrun = raster.block.Bytes().back() != 0;
   switch (result) {
-    case platform::ApartResult::Done: return overrun.Bytes()[0] != 0 ? Status::FileReadError : Status::Ok;
+    case platform::ApartResult::Done: return overrun ? Status::FileReadError : Status::Ok;
     case platform::ApartResult::NotStarted: return Status::MemoryAllocationError;
-    default: return overrun.Bytes()[0] != 0 ? Status::FileReadError : Status::DamagedFile;
+    case platform::ApartResult::Stopped: return Status::FunctionCancelled;
+    default: return overrun ? Status::FileReadError : Status::DamagedFile;
   }
+}
+
+bool DecodeHdpApart(const platform::ApartCall& call) {
+  DecodeRequest request;
+  if (call.request.size() != sizeof request || !HasHdpLibrary()) return false;
+  std::memcpy(&request, call.request.data(), sizeof request);
+  if (request.imageSize + request.alphaSize != call.input.size() || request.RasterBytes() + 1 != call.reply.size()) return false;
+  const std::span<uint8_t> raster = call.reply.first(request.RasterBytes());
+  const bool apart = request.alphaSize > 0;
+  bool overrun = false, alphaOverrun = false;
+  bool done =
+      DecodeStream({call.input.first(request.imageSize), 0, request.alpha != 0 && !apart}, request, raster, call.tell, overrun);
+  if (done && request.alpha != 0 && apart) {
+    const DecodeJob alpha = {call.input.subspan(request.imageSize), request.samples - 1, false};
+    done = DecodeStream(
+        alpha, request, raster, [](int32_t) {}, alphaOverrun);
+  }
+  call.reply.back() = overrun || alphaOverrun;
+  return done;
 }
 
 Status EncodeHdp(const PackedImage& image, const HdpEncoding& encoding, ByteWriter& out,

@@ -20,7 +20,7 @@ bool HasHdpLibrary();
 // together in the machine's byte order, 8-bit colors as blue, green, red, deeper ones as red, green, blue; alpha comes
 // last.
 struct HdpRaster {
-  platform::SharedBlock block;
+  platform::SharedBlock block;  // of rows, and a byte behind them that the decoder keeps for itself
   uint64_t stride = 0;
   uint32_t samples = 1;      // of a pixel, alpha among them
   uint32_t sampleBytes = 1;  // 0 for pixels of one bit, from the most significant one down
@@ -33,8 +33,13 @@ bool CanDecodeHdp(const HdpStream& stream);
 
 // Decodes a page. The library trusts what it reads, so it works apart: a fault in the data that brings it down is
 // DamagedFile like any other. FileReadError when the data end too early, FeatureDisabled without the library,
-// UnsupportedFormat for colors that CanDecodeHdp refuses, MemoryAllocationError. `told` receives finished rows.
+// UnsupportedFormat for colors that CanDecodeHdp refuses, MemoryAllocationError, FunctionCancelled when the program was asked to
+// end meanwhile. `told` receives finished rows.
 Status DecodeHdp(const HdpPage& page, HdpRaster& raster, const std::function<void(int32_t)>& told);
+
+// The part of it that runs apart: a row of the program's table of such work.
+inline constexpr char kHdpTask[] = "hdp-decode";
+bool DecodeHdpApart(const platform::ApartCall& call);
 
 struct HdpEncoding {
   int32_t quantizer = 0;  // 0 to 255, 0 is lossless

@@ -21,7 +21,9 @@
 #include "platform/first_start.h"
 #include "platform/folders.h"
 #include "platform/process.h"
+#include "platform/work_apart.h"
 #include "plugins/plugin_table.h"
+#include "registry/child_tasks.h"
 #include "registry/registry.h"
 #include "settings/configuration.h"
 #include "settings/format_switches.h"
@@ -134,4 +136,10 @@ class App : public wxApp {
 
 }  // namespace fotomill::desktop
 
-wxIMPLEMENT_APP(fotomill::desktop::App);
+wxIMPLEMENT_APP_NO_MAIN(fotomill::desktop::App);
+
+int main(int count, char** arguments) {
+  using namespace fotomill;
+  if (const auto status = platform::ServeApart(count, arguments, ChildTasks())) return *status;
+  return wxEntry(count, arguments);
+}
