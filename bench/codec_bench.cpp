@@ -64,7 +64,7 @@ void Decode(benchmark::State& state, const char* extension, Content content, int
   if (row.write(*source, {}) != Status::Ok) state.SkipWithError("cannot write");
   const PicturePointer picture = NewPictureRecord();
   for (auto _ : state) {
-    if (row.read(*picture, name.c_str()) != Status::Ok) state.SkipWithError("cannot read");
+    if (row.read(*picture, {.fileName = name}) != Status::Ok) state.SkipWithError("cannot read");
   }
   std::filesystem::remove(name);
   SetBytes(state, picture->image);

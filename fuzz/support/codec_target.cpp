@@ -7,7 +7,6 @@
 
 #include "core/limits.h"
 #include "formats/bmp/bmp.h"
-#include "settings/settings.h"
 #include "support/scratch_file.h"
 
 namespace fotomill::fuzz {
@@ -20,10 +19,10 @@ uint32_t Hash(const uint8_t* data, size_t size) {
   return hash;
 }
 
-void Write(const WriteOperation write, PictureRecord& picture) {
+void Write(const WriteOperation write, PictureRecord& picture, const EncodeOptions& encode) {
   static const std::string path = ScratchPath("out");
   picture.fileName.AssignCut(path);
-  (void)write(picture, {});
+  (void)write(picture, {.encode = encode});
   unlink(path.c_str());
 }
 
@@ -34,21 +33,19 @@ void TryCodec(const char* extension, const uint8_t* data, size_t size) {
   limits.packedBlockBytes = 4 << 20;
   limits.textScanBytes = 64 << 10;
   const uint32_t options = Hash(data, size);
-  settings.UseAlphaChannels = options & 1;
-  settings.WriteOS2Bitmaps = options >> 1 & 1;
-  settings.CreateMacbinaryHeader = options >> 2 & 1;
+  const EncodeOptions encode{.bmpOs2 = (options >> 1 & 1) != 0, .macBinary = (options >> 2 & 1) != 0};
 
-  const std::string& path = file.Fill(data, size);
+  const ReadRequest request{.fileName = file.Fill(data, size), .options = {.alphaChannels = (options & 1) != 0}};
   const FormatEntry& row = FormatRow(FindFormatByName(std::string("a.") + extension));
   const PicturePointer picture = NewPictureRecord(), described = NewPictureRecord();
-  described->fileName.AssignCut(path);
-  const Status info = row.info(*described, path.c_str(), 0);
+  described->fileName.AssignCut(request.fileName);
+  const Status info = row.info(*described, request);
   if (row.details != nullptr) (void)row.details(*described);
   AnimationPointer animation;
-  if (row.animate != nullptr && row.animate(path.c_str(), animation) == Status::Ok) {
+  if (row.animate != nullptr && row.animate(request, animation) == Status::Ok) {
     while (animation->Next() == Status::Ok) continue;
   }
-  const Status read = row.read(*picture, path.c_str());
+  const Status read = row.read(*picture, request);
   if (read != Status::Ok) {
     if (!picture->image.Empty() || !picture->alpha.Empty()) std::abort();
     return;
@@ -56,8 +53,8 @@ void TryCodec(const char* extension, const uint8_t* data, size_t size) {
   if (info == Status::Ok && (picture->image.Width() != described->width || picture->image.Height() != described->height)) {
     std::abort();
   }
-  if (CanWrite(row)) Write(row.write, *picture);
-  Write(BmpWrite, *picture);
+  if (CanWrite(row)) Write(row.write, *picture, encode);
+  Write(BmpWrite, *picture, encode);
 }
 
 }  // namespace fotomill::fuzz

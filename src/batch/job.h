@@ -77,6 +77,8 @@ struct BatchJob {
 
   OverwritePolicy overwrite;
   NamingOptions naming;
+  ReadOptions read;      // of sources
+  EncodeOptions encode;  // of outputs
   ReduceOptions reduction;          // of outputs whose format takes fewer colors
   ProgressSettings boxSettings;
   uint32_t historyFunctions = ~0u;  // FileHistoryFunctions: a bit for each function whose files are recorded

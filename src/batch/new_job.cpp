@@ -58,6 +58,8 @@ BatchJob NewBatchJob() {
   BatchJob job;
   job.overwrite = OverwritePolicyFromSettings();
   job.naming = NamingOptionsFromSettings();
+  job.read = ReadOptionsFromSettings();
+  job.encode = EncodeOptionsFromSettings();
   job.reduction = ReduceOptionsFromSettings();
   job.boxSettings = ProgressSettingsFromSettings();
   job.historyFunctions = static_cast<uint32_t>(settings.FileHistoryFunctions);

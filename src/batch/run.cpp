@@ -162,7 +162,7 @@ class Batch {
     const BatchFile& file = files_[i];
     PicturePointer copy;
     if (!last && !IsOnlyPlanned()) {
-      copy = NewPictureRecord(picture->window, picture->context);
+      copy = NewPictureRecord(picture->defaultColour, picture->window, picture->context);
       const Status status = copy != nullptr ? CopyPicture(*picture, *copy) : Status::MemoryAllocationError;
       if (status != Status::Ok) return Failure(file, status);
     }
@@ -205,10 +205,11 @@ class Batch {
   }
 
   Status Load(const std::string& name, PicturePointer& picture) const {
-    RETURN_IF_BAD(LoadPictureInfo(name.c_str(), picture));
-    picture->page = function_.page - 1;
+    ReadRequest request{.fileName = name, .options = job_.read};
+    RETURN_IF_BAD(LoadPictureInfo(request, picture));
+    request.page = function_.page - 1;
     if (IsOnlyPlanned()) return function_.page > picture->pageCount ? Status::NoImages : Status::Ok;
-    RETURN_IF_BAD(ReadPicture(*picture));
+    RETURN_IF_BAD(ReadPicture(request, *picture));
     return function_.autoOrient ? TurnUpright(*picture) : Status::Ok;
   }
 
@@ -340,12 +341,12 @@ class Batch {
     const bool beside = (job_.naming.beside || job_.destinationFolder.empty()) && target.output->folder.empty();
     const bool there = beside || !function_.out.empty() || destination.elsewhere;
     if (!there && !platform::MakeFolders(FolderOf(destination.path))) return Status::ErrorCreatingFile;
-    WriteOptions write;
+    WriteOptions write{.encode = job_.encode};
     write.existing = destination.replace ? platform::Existing::Replace : platform::Existing::Refuse;
     write.keepMetadata = function_.keepMetadata;
     write.comment = job_.writeComments;
     write.password = destination.password;
-    write.quality = target.output->quality;
+    if (target.output->quality > 0) write.encode.SetQuality(target.output->quality);
     if (destination.recycle) {
       write.makeWay = [&] { return !platform::FileExists(destination.path) || platform::MoveToTrash(destination.path); };
     }
@@ -373,12 +374,14 @@ class Batch {
       WriteOptions attempt = write;
       attempt.existing = platform::Existing::Replace;
       attempt.makeWay = {};
-      attempt.quality = quality;
+      attempt.encode.SetQuality(quality);
       const Status status = WritePictureAs(picture, file.Path(), target.formatIndex, attempt);
       bytes = platform::FactsOf(file.Path()).size;
       return status;
     };
-    const Status status = FindQuality(target.output->mostBytes, trial, write.quality, smallest);
+    int32_t best = 0;
+    const Status status = FindQuality(target.output->mostBytes, trial, best, smallest);
+    if (status == Status::Ok) write.encode.SetQuality(best);
     picture.fileName = source;
     if (status == Status::UnsuitableImage) hint = "At the lowest quality it has " + WithThousands(smallest) + " bytes.";
     return status;

@@ -57,8 +57,9 @@ std::string Obstacle(const PictureRecord& picture) {
 // One file on its way.
 class Turning {
  public:
-  Turning(const std::string& source, const std::string& destination, const TurnRequest& request, const WriteOptions& options)
-      : source_(source), destination_(destination), request_(request), options_(options) {}
+  Turning(const std::string& source, const std::string& destination, const TurnRequest& request, const ReadOptions& read,
+          const WriteOptions& options)
+      : source_(source), destination_(destination), request_(request), read_(read), options_(options) {}
 
   TurnedFile Run() {
     result_.status = Turn();
@@ -74,7 +75,7 @@ class Turning {
   Status Turn() {
     facts_ = platform::FactsOf(source_);
     PicturePointer picture;
-    if (const Status status = LoadPictureInfo(source_.c_str(), picture); status != Status::Ok) {
+    if (const Status status = LoadPictureInfo({.fileName = source_, .options = read_}, picture); status != Status::Ok) {
       return Fail(status, OpenHint(source_, status));
     }
     const auto time = request_.keepTime ? platform::ModificationTime(source_) : std::nullopt;
@@ -88,7 +89,8 @@ class Turning {
     if (!file.Open(source_)) return Status::FileOpenError;
     std::vector<uint8_t> made;
     JpegTurnResult turned;
-    const JpegTurnWish wish{.turn = request_.turn, .seenByExif = request_.seenByExif, .trim = request_.trim};
+    const JpegTurnWish wish{
+        .turn = request_.turn, .seenByExif = request_.seenByExif, .trim = request_.trim, .encode = options_.encode};
     if (const Status status = MakeTurnedJpeg(file.Bytes(), wish, made, turned); status != Status::Ok) {
       return Fail(status, turned.obstacle);
     }
@@ -103,7 +105,7 @@ class Turning {
 
   Status TurnDecoded(PicturePointer picture) {
     if (std::string obstacle = Obstacle(*picture); !obstacle.empty()) return Fail(Status::UnsuitableImage, std::move(obstacle));
-    RETURN_IF_BAD(ReadPicture(*picture));
+    RETURN_IF_BAD(ReadPicture({.fileName = source_, .options = read_}, *picture));
     if (std::string obstacle = Obstacle(*picture); !obstacle.empty()) return Fail(Status::UnsuitableImage, std::move(obstacle));
     const Orientation told = OrientationOf(*picture);
     const Orientation turn = Composed(request_.seenByExif ? told : Orientation::Upright, request_.turn);
@@ -121,12 +123,12 @@ class Turning {
     platform::TemporaryFile working;
     if (!working.Create(std::string(".").append(platform::ExtensionOf(source_)))) return Status::ErrorCreatingFile;
     RefreshExif(picture);
-    WriteOptions plain;
+    WriteOptions plain{.encode = options_.encode};
     plain.lossless = true;
     plain.comment = options_.comment;
     RETURN_IF_BAD(WritePictureAs(picture, working.Path(), picture.formatIndex, plain));
     PicturePointer back;
-    RETURN_IF_BAD(LoadPicture(working.Path().c_str(), back));
+    RETURN_IF_BAD(LoadPicture({.fileName = working.Path(), .options = read_}, back));
     const PictureMetadata& metadata = picture.metadata;
     const bool kept = metadata.exif.empty() == back->metadata.exif.empty() && metadata.xmp == back->metadata.xmp &&
                       metadata.icc == back->metadata.icc;
@@ -158,6 +160,7 @@ class Turning {
 
   const std::string &source_, &destination_;
   const TurnRequest& request_;
+  const ReadOptions& read_;
   const WriteOptions& options_;
   platform::FileFacts facts_;  // of the source when it was not read yet
   TurnedFile result_;
@@ -166,8 +169,8 @@ class Turning {
 }  // namespace
 
 TurnedFile TurnPictureFile(const std::string& source, const std::string& destination, const TurnRequest& request,
-                           const WriteOptions& options) {
-  return Turning(source, destination, request, options).Run();
+                           const ReadOptions& read, const WriteOptions& options) {
+  return Turning(source, destination, request, read, options).Run();
 }
 
 }  // namespace fotomill

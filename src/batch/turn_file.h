@@ -3,6 +3,7 @@
 #include <string>
 
 #include "core/status.h"
+#include "picture/read_request.h"
 #include "picture/write_options.h"
 #include "processing/geometry/orient.h"
 
@@ -29,6 +30,6 @@ struct TurnedFile {
 // but only where the new file then holds every pixel as it was: UnsuitableImage (13), with a hint, where it does not. Nothing is
 // written unless Ok.
 TurnedFile TurnPictureFile(const std::string& source, const std::string& destination, const TurnRequest& request,
-                           const WriteOptions& options);
+                           const ReadOptions& read, const WriteOptions& options);
 
 }  // namespace fotomill

@@ -101,7 +101,7 @@ class TurnBatch {
 
   void Turn(FileOutcome& outcome) const {
     const std::string folder(platform::SplitPath(outcome.destination).folder);
-    WriteOptions options;
+    WriteOptions options{.encode = job_.encode};
     options.comment = job_.writeComments;
     options.existing = outcome.replaced ? platform::Existing::Replace : platform::Existing::Refuse;
     bool kept = true;
@@ -112,7 +112,7 @@ class TurnBatch {
     if (!folder.empty() && !platform::MakeFolders(folder)) {
       turned = {.status = Status::ErrorCreatingFile, .hint = "There is no folder \"" + folder + "\"."};
     } else {
-      turned = TurnPictureFile(outcome.source, outcome.destination, function_.request, options);
+      turned = TurnPictureFile(outcome.source, outcome.destination, function_.request, job_.read, options);
     }
     if (turned.changed && function_.inPlace && function_.replaced) function_.replaced(outcome.source);
     outcome.status = turned.status;

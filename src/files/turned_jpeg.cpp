@@ -12,7 +12,8 @@ namespace fotomill {
 namespace {
 
 // A thumbnail may be encoded anew where its pixels cannot be turned as they are.
-Status TurnThumbnail(std::span<const uint8_t> bytes, Orientation orientation, std::vector<uint8_t>& made) {
+Status TurnThumbnail(std::span<const uint8_t> bytes, Orientation orientation, const EncodeOptions& encode,
+                     std::vector<uint8_t>& made) {
   TurnedJpeg turned;
   if (TurnJpeg(bytes, orientation, false, turned) == Status::Ok && !turned.file.empty()) {
     JpegHead head;
@@ -23,16 +24,16 @@ Status TurnThumbnail(std::span<const uint8_t> bytes, Orientation orientation, st
   RETURN_IF_BAD(DecodeExifThumbnail(bytes, picture));
   picture->metadata = {};  // an orientation of its own would be another one
   RETURN_IF_BAD(OrientPicture(*picture, orientation));
-  return EncodeExifThumbnail(*picture, made);
+  return EncodeExifThumbnail(*picture, encode, made);
 }
 
 // Makes a block tell of the turned picture.
-void TurnExif(std::vector<uint8_t>& exif, Orientation orientation, const TurnedJpeg& turned) {
+void TurnExif(std::vector<uint8_t>& exif, Orientation orientation, const TurnedJpeg& turned, const EncodeOptions& encode) {
   if (exif.empty()) return;
   ExifFindings findings;
   std::vector<uint8_t> thumbnail;
   WalkExif(exif, nullptr, &findings);
-  const Status made = TurnThumbnail(ExifThumbnail(exif, findings), orientation, thumbnail);
+  const Status made = TurnThumbnail(ExifThumbnail(exif, findings), orientation, encode, thumbnail);
   if (made != Status::Ok || !ReplaceExifThumbnail(exif, thumbnail, kMostExif)) DropExifThumbnail(exif);
   SetExifPictureFacts(exif, {.width = turned.width, .height = turned.height, .orientation = 1});
 }
@@ -73,7 +74,7 @@ class TurnedFile {
   }
 
   Status WithPixels(Orientation wanted, const TurnedJpeg& turned, std::vector<uint8_t>& made) {
-    TurnExif(exif_, wanted, turned);
+    TurnExif(exif_, wanted, turned, wish_.encode);
     SetXmpOrientation(xmp_, 1);
     return AssembleJpeg(
         file_, head_,

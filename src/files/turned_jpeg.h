@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "core/status.h"
+#include "picture/encode_options.h"
 #include "processing/geometry/orient.h"
 
 namespace fotomill {
@@ -15,6 +16,7 @@ struct JpegTurnWish {
   Orientation turn = Orientation::Upright;  // of the picture as it is seen
   bool seenByExif = true;                   // it is seen as its EXIF orientation says; otherwise as its pixels are stored
   bool trim = false;                        // cut off edges that cannot be turned without loss
+  EncodeOptions encode = {};                // of the thumbnail inside, where that cannot be turned without loss
 };
 
 // How a JPEG file was turned.

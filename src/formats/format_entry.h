@@ -10,6 +10,7 @@
 #include "core/status.h"
 #include "picture/animation.h"
 #include "picture/picture_record.h"
+#include "picture/read_request.h"
 #include "picture/write_options.h"
 
 namespace fotomill {
@@ -42,10 +43,10 @@ inline constexpr uint32_t FMT_ALPHA = 0x2000000;        // stores an alpha chann
 
 // Operations of a row. Codecs implement them as plain functions; none of them knows the registry.
 using DetailsOperation = Status (*)(PictureRecord& picture);  // fills `detailLines` of a record that `info` has filled
-using InfoOperation = Status (*)(PictureRecord& picture, const char* fileName, uint32_t flags);
-using ReadOperation = Status (*)(PictureRecord& picture, const char* fileName);
+using InfoOperation = Status (*)(PictureRecord& picture, const ReadRequest& request);
+using ReadOperation = Status (*)(PictureRecord& picture, const ReadRequest& request);
 using WriteOperation = Status (*)(PictureRecord& picture, const WriteOptions& options);  // to picture.fileName
-using AnimateOperation = Status (*)(const char* fileName, AnimationPointer& animation);  // opens a file's frames
+using AnimateOperation = Status (*)(const ReadRequest& request, AnimationPointer& animation);  // opens a file's frames
 using LifeOperation = int32_t (*)();
 using OptionsOperation = int32_t (*)(void* parentWindow, int32_t parameter);
 

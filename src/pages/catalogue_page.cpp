@@ -42,7 +42,7 @@ bool NextPageName(BatchJob& job, std::string& path) {
 Status WritePage(PictureRecord& page, const CataloguePageOptions& options, const Destination& destination, BatchJob& job) {
   if (options.dryRun) return Status::Ok;
   if (!job.destinationFolder.empty() && !platform::MakeFolders(job.destinationFolder)) return Status::ErrorCreatingFile;
-  WriteOptions write;
+  WriteOptions write{.encode = job.encode};
   write.existing = destination.replace ? platform::Existing::Replace : platform::Existing::Refuse;
   write.password = destination.password;
   if (destination.recycle) write.makeWay = [&] { return platform::MoveToTrash(destination.path); };
@@ -88,15 +88,17 @@ class ContactSheet {
   }
 
   void Draw(FileOutcome& outcome, PackedImage& image) const {
+    const ReadRequest request{.fileName = outcome.source,
+                              .thumbnailSide = std::max(options_.look.cellWidth, options_.look.cellHeight),
+                              .options = job_.read};
     PicturePointer picture;
-    outcome.status = LoadPictureInfo(outcome.source.c_str(), picture);
-    if (outcome.status == Status::Ok && !options_.page.dryRun) outcome.status = DrawPicture(*picture, image);
+    outcome.status = LoadPictureInfo(request, picture);
+    if (outcome.status == Status::Ok && !options_.page.dryRun) outcome.status = DrawPicture(request, *picture, image);
     if (outcome.status != Status::Ok) outcome.hint = OpenHint(outcome.source, outcome.status);
   }
 
-  Status DrawPicture(PictureRecord& picture, PackedImage& image) const {
-    picture.thumbnailSide = std::max(options_.look.cellWidth, options_.look.cellHeight);
-    RETURN_IF_BAD(ReadPicture(picture));
+  Status DrawPicture(const ReadRequest& request, PictureRecord& picture, PackedImage& image) const {
+    RETURN_IF_BAD(ReadPicture(request, picture));
     if (options_.upright) RETURN_IF_BAD(TurnUpright(picture));
     return MakeCellImage(picture, options_.look, image);
   }
@@ -124,7 +126,7 @@ class ContactSheet {
   }
 
   Status NewPage() {
-    PicturePointer page = NewPictureRecord();
+    PicturePointer page = NewPictureRecord(job_.read.alphaBackground);
     if (page == nullptr) return Status::MemoryAllocationError;
     if (!options_.page.dryRun) RETURN_IF_BAD(NewCataloguePage(options_.look, page->image));
     const Rectangle size = PageSize(options_.look);

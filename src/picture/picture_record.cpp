@@ -5,8 +5,6 @@
 #include <new>
 #include <numeric>
 
-#include "settings/settings.h"
-
 namespace fotomill {
 
 void DetailLines::AddFormat(const char* format, ...) {
@@ -18,12 +16,12 @@ void DetailLines::AddFormat(const char* format, ...) {
   Add(line);
 }
 
-PicturePointer NewPictureRecord(void* window, void* context) {
+PicturePointer NewPictureRecord(Color defaultColour, void* window, void* context) {
   PicturePointer picture(new (std::nothrow) PictureRecord);
   if (picture == nullptr) return picture;
   picture->window = window;
   picture->context = context;
-  picture->defaultColour = static_cast<Color>(settings.AlphaBackground);
+  picture->defaultColour = defaultColour;
   std::iota(picture->remap.begin(), picture->remap.end(), uint8_t{0});
   return picture;
 }

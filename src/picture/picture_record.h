@@ -22,10 +22,6 @@ using Color = uint32_t;
 inline constexpr uint8_t kHasAlpha = 1;             // the picture has alpha; set by `info` for sources deeper than 24 bits
 inline constexpr uint8_t kFlattenOnBackground = 2;  // flatten onto the record's own background
 
-// Request flag of `info`: only formats that know their files by a signature are asked. The others answer
-// UnsupportedFormat (8) without opening the file.
-inline constexpr uint32_t kInfoSignedOnly = 0x200;
-
 // Bits of PictureRecord::lostMetadata.
 inline constexpr uint8_t kLostExif = 1, kLostXmp = 2, kLostIcc = 4;
 
@@ -89,13 +85,9 @@ struct PictureRecord {
   int32_t pageCount = 1;               // pages or frames in the file
   bool simplified = false;             // by `info`: the file holds what a new one would not, deeper samples or further inks
   int32_t hotSpotX = 0, hotSpotY = 0;  // of a cursor, pixels from the left and the top
-  int32_t page = 0;                    // the page that `read` is to decode, from 0
-  int32_t thumbnailSide = 0;           // above 0: a decoder may deliver any smaller size that is still twice that of the largest
-                                       // picture inside this square, which is what its longer edge decides; `width` and `height`
-                                       // keep the full size, `image` tells its own
-  int32_t reduction = 1;               // how many pixels along each edge one of such an image stands for; the last column and row
-                                       // may stand for fewer
-  ProgressSink* progress = nullptr;    // not owned, may be null
+  int32_t reduction = 1;               // of a picture decoded smaller than it is: how many pixels along each edge one of `image`
+                                       // stands for; the last column and row may stand for fewer
+  ProgressSink* progress = nullptr;    // of the operation in work; not owned, may be null
 
   void ReportRow(int32_t done) const { ReportRow(done, height); }
   void ReportRow(int32_t done, int32_t total) const {
@@ -105,8 +97,8 @@ struct PictureRecord {
 
 using PicturePointer = std::unique_ptr<PictureRecord>;
 
-// A new record with its defaults set: format -1, identity `remap`, `defaultColour` from the settings. Null without memory.
-PicturePointer NewPictureRecord(void* window = nullptr, void* context = nullptr);
+// A new record with its defaults set: format -1, identity `remap`. Null without memory.
+PicturePointer NewPictureRecord(Color defaultColour = 0xffffff, void* window = nullptr, void* context = nullptr);
 
 // The usual estimate of a picture's pixel data: ((width + 7) / 8) x bits x height.
 constexpr uint64_t EstimateImageBytes(int32_t width, int32_t height, int32_t bitsPerPixel) {

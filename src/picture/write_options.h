@@ -5,19 +5,22 @@
 
 #include "core/byte_writer.h"
 #include "core/status.h"
+#include "picture/encode_options.h"
 #include "platform/output_file.h"
 
 namespace fotomill {
 
-// What the caller of a `write` operation decides beside the settings.
+// What a writer is asked for.
 struct WriteOptions {
+  EncodeOptions encode = {};                                  // as the settings were when the job began
   platform::Existing existing = platform::Existing::Replace;  // what to do about a file of the destination's name
-  bool keepMetadata = true;       // EXIF, XMP and ICC of the record go into formats that can hold them
-  bool lossless = false;     // without any loss where the format can, whatever the settings say
-  bool comment = false;           // the comment of the record goes into files of plug-in formats
-  int32_t quality = 0;       // 1 to 100, of formats with lossy compression; 0: as the settings say
-  std::string password;           // for formats that can be protected; empty: none
-  std::function<bool()> makeWay;  // called when the new file is whole, before it gets its name; false: it never does
+  bool keepMetadata = true;            // EXIF, XMP and ICC of the record go into formats that can hold them
+  bool lossless = false;               // without any loss where the format can, whatever `encode` says
+  bool comment = false;                // the comment of the record goes into files of plug-in formats
+  std::string password = {};           // for formats that can be protected; empty: none
+  std::function<bool()> makeWay = {};  // called when the new file is whole, before it gets its name; false: it never does
+
+  bool KeepsMetadata() const { return keepMetadata && encode.preserveMetadata; }
 };
 
 // The status that a commit's outcome means: ErrorWritingFile when a write failed, ErrorCreatingFile when the name was taken

@@ -31,10 +31,14 @@ int32_t configurationCount = 0;
 
 // The picture whose call is running on this thread; the progress entries have no argument that could tell.
 thread_local PictureRecord* currentPicture = nullptr;
+// How it is read; pictures that the module loads meanwhile are read alike.
+thread_local const ReadOptions* currentOptions = nullptr;
+
+ReadOptions CurrentOptions() { return currentOptions == nullptr ? ReadOptions() : *currentOptions; }
 
 FMW_HANDLE FMW_CALL HostLoadPicture(const char* fileName, int32_t* error) {
   PicturePointer picture;
-  Status status = fileName == nullptr ? Status::FileOpenError : LoadPicture(fileName, picture);
+  Status status = fileName == nullptr ? Status::FileOpenError : LoadPicture({.fileName = fileName, .options = CurrentOptions()}, picture);
   void* block = status == Status::Ok ? platform::NewModuleBlock(picture->image.Bytes()) : nullptr;
   if (status == Status::Ok && block == nullptr) status = Status::MemoryAllocationError;
   if (error != nullptr) *error = StatusNumber(status);
@@ -58,8 +62,10 @@ void FMW_CALL HostSetStatus(const char* text) {
 // One call into a module: holds the mutex, names the picture, and carries the service block.
 class ModuleCall {
  public:
-  explicit ModuleCall(PictureRecord& picture) : lock_(CallMutex()), before_(currentPicture) {
+  explicit ModuleCall(PictureRecord& picture, const ReadOptions* options = nullptr)
+      : lock_(CallMutex()), before_(currentPicture), optionsBefore_(currentOptions) {
     currentPicture = &picture;
+    currentOptions = options;
     services_.size = sizeof services_;
     services_.version = FMW_PLUGIN_VERSION;
     std::copy_n("RXaR", 4, services_.mark);
@@ -72,7 +78,10 @@ class ModuleCall {
     services_.configuration = configuration;
     services_.configurationCount = configurationCount;
   }
-  ~ModuleCall() { currentPicture = before_; }
+  ~ModuleCall() {
+    currentPicture = before_;
+    currentOptions = optionsBefore_;
+  }
   ModuleCall(const ModuleCall&) = delete;
   ModuleCall& operator=(const ModuleCall&) = delete;
   FMW_HOST_SERVICES* Services() { return &services_; }
@@ -80,6 +89,7 @@ class ModuleCall {
  private:
   std::lock_guard<std::recursive_mutex> lock_;
   PictureRecord* before_;
+  const ReadOptions* optionsBefore_;
   FMW_HOST_SERVICES services_ = {};
 };
 
@@ -124,29 +134,29 @@ Status CallWriter(const PluginEntry& entry, PictureRecord& picture, const std::s
 
 }  // namespace
 
-Status PluginInfo(PictureRecord& picture, const char* fileName, uint32_t) {
-  const PluginEntry* entry = FindPluginEntry(fileName);
+Status PluginInfo(PictureRecord& picture, const ReadRequest& request) {
+  const PluginEntry* entry = FindPluginEntry(request.fileName);
   if (entry == nullptr || entry->exports.getInfo == nullptr) return Status::UnsupportedFunction;
   FMW_PICTURE_INFO info = {};
   info.size = sizeof info;
   info.version = FMW_PLUGIN_VERSION;
-  info.frame = picture.page;
+  info.frame = request.page;
   int32_t error = 0;
-  ModuleCall call(picture);
-  if (entry->exports.getInfo(&info, fileName, &error, call.Services()) == 0) return ModuleError(error);
-  picture.fileSize = platform::FactsOf(fileName).size;
+  ModuleCall call(picture, &request.options);
+  if (entry->exports.getInfo(&info, request.fileName.c_str(), &error, call.Services()) == 0) return ModuleError(error);
+  picture.fileSize = platform::FactsOf(request.fileName).size;
   return TakeInfo(info, picture);
 }
 
-Status PluginRead(PictureRecord& picture, const char* fileName) {
-  const PluginEntry* entry = FindPluginEntry(fileName);
+Status PluginRead(PictureRecord& picture, const ReadRequest& request) {
+  const PluginEntry* entry = FindPluginEntry(request.fileName);
   if (entry == nullptr || entry->exports.readImage == nullptr) return Status::UnsupportedFunction;
-  RETURN_IF_BAD(PluginComment(picture, fileName));
+  RETURN_IF_BAD(PluginComment(picture, request.fileName.c_str()));
   const std::string comment = CommentText(picture);
   int32_t error = 0;
-  ModuleCall call(picture);
+  ModuleCall call(picture, &request.options);
   call.Services()->comment = comment.empty() ? nullptr : comment.c_str();
-  void* handle = entry->exports.readImage(fileName, &error, call.Services());
+  void* handle = entry->exports.readImage(request.fileName.c_str(), &error, call.Services());
   if (handle == nullptr) return ModuleError(error);
   const auto block = platform::LockModuleBlock(handle);
   Status status = Status::MemoryAllocationError;

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "picture/picture_record.h"
+#include "picture/read_request.h"
 #include "picture/write_options.h"
 #include "plugins/fotomill_plugin.h"
 
@@ -11,10 +12,10 @@ namespace fotomill {
 // All answer UnsupportedFunction (5) when no module serves the extension; a module's own error numbers are passed on.
 
 // Fills the facts. DamagedFile (2) when the module claims sizes or depths that no picture has.
-Status PluginInfo(PictureRecord& picture, const char* fileName, uint32_t flags);
+Status PluginInfo(PictureRecord& picture, const ReadRequest& request);
 // Decodes into `image`, and `alpha` for 32-bit bitmaps. DamagedFile (2) when the returned bitmap is not what its header
 // claims, MemoryAllocationError (6) when it cannot be locked or held.
-Status PluginRead(PictureRecord& picture, const char* fileName);
+Status PluginRead(PictureRecord& picture, const ReadRequest& request);
 // Lets the module write a working file beside the destination, which then takes its name. Nothing is left of a failed
 // write. The comment goes along where the options say so.
 Status PluginWrite(PictureRecord& picture, const WriteOptions& options);

@@ -10,13 +10,13 @@ namespace fotomill {
 namespace {
 
 // Operations of rows whose codec this build does not have.
-Status NoInfo(PictureRecord&, const char*, uint32_t) { return Status::UnsupportedFunction; }
-Status NoRead(PictureRecord&, const char*) { return Status::UnsupportedFunction; }
+Status NoInfo(PictureRecord&, const ReadRequest&) { return Status::UnsupportedFunction; }
+Status NoRead(PictureRecord&, const ReadRequest&) { return Status::UnsupportedFunction; }
 Status NoWrite(PictureRecord&, const WriteOptions&) { return Status::UnsupportedFunction; }
 
 // The fractal format: its coder was never published and is gone.
-Status UnpublishedInfo(PictureRecord&, const char*, uint32_t) { return Status::UnsupportedFormat; }
-Status UnpublishedRead(PictureRecord&, const char*) { return Status::UnsupportedFormat; }
+Status UnpublishedInfo(PictureRecord&, const ReadRequest&) { return Status::UnsupportedFormat; }
+Status UnpublishedRead(PictureRecord&, const ReadRequest&) { return Status::UnsupportedFormat; }
 Status UnpublishedWrite(PictureRecord&, const WriteOptions&) { return Status::UnsupportedFormat; }
 
 // The archive rows' hooks: nothing has to be loaded for ZIP; RAR waits for its library.

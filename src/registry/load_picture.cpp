@@ -3,45 +3,46 @@
 
 namespace fotomill {
 
-Status LoadPictureInfo(const char* fileName, PicturePointer& picture, uint32_t flags) {
+Status LoadPictureInfo(const ReadRequest& request, PicturePointer& picture) {
   picture.reset();
-  const int32_t index = FindFormatByName(fileName);
+  const int32_t index = FindFormatByName(request.fileName);
   if (index == kNoFormat) return Status::UnsupportedFormat;
-  PicturePointer made = NewPictureRecord();
+  PicturePointer made = NewPictureRecord(request.options.alphaBackground);
   if (made == nullptr) return Status::MemoryAllocationError;
-  if (!made->fileName.Assign(fileName)) return Status::FileOpenError;
+  if (!made->fileName.Assign(request.fileName)) return Status::FileOpenError;
   made->formatIndex = index;
+  made->progress = request.progress;
   const FormatEntry& row = FormatRow(index);
-  if (row.info != nullptr) RETURN_IF_BAD(row.info(*made, fileName, flags));
+  if (row.info != nullptr) RETURN_IF_BAD(row.info(*made, request));
   picture = std::move(made);
   return Status::Ok;
 }
 
-Status LoadPicture(const char* fileName, PicturePointer& picture, void* window) {
+Status LoadPicture(const ReadRequest& request, PicturePointer& picture, void* window) {
   PicturePointer made;
   picture.reset();
-  RETURN_IF_BAD(LoadPictureInfo(fileName, made));
+  RETURN_IF_BAD(LoadPictureInfo(request, made));
   made->window = window;
-  RETURN_IF_BAD(ReadPicture(*made));
+  RETURN_IF_BAD(ReadPicture(request, *made));
   picture = std::move(made);
   return Status::Ok;
 }
 
-Status ReadPicture(PictureRecord& picture) {
+Status ReadPicture(const ReadRequest& request, PictureRecord& picture) {
   if (picture.formatIndex == kNoFormat) return Status::UnsupportedFormat;
-  if (picture.page < 0 || picture.page >= picture.pageCount) return Status::NoImages;
+  if (request.page < 0 || request.page >= picture.pageCount) return Status::NoImages;
   const FormatEntry& row = FormatRow(picture.formatIndex);
   if (row.read == nullptr || (row.flags & FMT_RENDERED) != 0) return Status::Ok;
-  const PathText fileName = picture.fileName;  // the codec may use the record's own for a working file
-  return row.read(picture, fileName.c_str());
+  picture.progress = request.progress;
+  return row.read(picture, request);
 }
 
-Status OpenAnimation(const char* fileName, AnimationPointer& animation) {
+Status OpenAnimation(const ReadRequest& request, AnimationPointer& animation) {
   animation.reset();
-  const int32_t index = FindFormatByName(fileName);
+  const int32_t index = FindFormatByName(request.fileName);
   if (index == kNoFormat) return Status::UnsupportedFormat;
   const AnimateOperation animate = FormatRow(index).animate;
-  return animate == nullptr ? Status::UnsupportedFunction : animate(fileName, animation);
+  return animate == nullptr ? Status::UnsupportedFunction : animate(request, animation);
 }
 
 Status WritePicture(PictureRecord& picture, std::string_view destination, const WriteOptions& options) {

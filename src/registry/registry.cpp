@@ -1,10 +1,10 @@
 #include "registry/registry.h"
 
 #include <algorithm>
+#include <atomic>
 
 #include "core/text.h"
 #include "platform/paths.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -18,6 +18,7 @@ FormatTable& Table() {
 
 constinit thread_local FormatEntry spareRow = SpareRow();
 const PluginSource* pluginSource = nullptr;
+std::atomic<bool> pluginsOverride = false;
 
 // A row matches an extension that equals its own, or that shares its first three characters; a shorter one must match
 // to its end.
@@ -39,11 +40,13 @@ int32_t FindFormatByName(std::string_view fileName, int32_t parameter) {
   for (int32_t i = 0; i < formatCount && !extension.empty(); ++i) {
     const FormatEntry& row = FormatRow(i);
     if ((row.flags & (FMT_SPARE | FMT_CLIPBOARD)) != 0) continue;
-    if (settings.AllowPluginFormatOverride != 0 && row.enabled == 0) continue;
+    if (row.enabled == 0 && pluginsOverride) continue;
     if (RowMatches(row.extension, extension)) return i;
   }
   return FindPluginFormat(fileName, parameter);
 }
+
+void LetPluginsOverrideFormats(bool on) { pluginsOverride = on; }
 
 void InstallPluginSource(const PluginSource* source) { pluginSource = source; }
 

@@ -22,8 +22,10 @@ int32_t EnabledByDefault(int32_t index);
 
 // The row that a file name selects by its extension, or kNoFormat. The first row wins whose extension equals the
 // name's, or whose first three characters equal the first three of the name's, ignoring case; spare rows are skipped, as
-// are disabled ones with `AllowPluginFormatOverride`. Where no row matches, the plug-ins are asked.
+// are disabled ones where plug-ins override them. Where no row matches, the plug-ins are asked.
 int32_t FindFormatByName(std::string_view fileName, int32_t parameter = 0);
+// `AllowPluginFormatOverride`: rows that are switched off leave their extensions to the plug-ins. At first they do not.
+void LetPluginsOverrideFormats(bool on);
 
 // What the registry asks the plug-in loader for. Without one no plug-in format exists.
 struct PluginFormatFacts {
@@ -59,19 +61,18 @@ std::vector<FormatLibrary> LibrariesOfFormats();
 void RunFormatStartup();
 void RunFormatShutdown();
 
-// Opens and decodes a file into a new record: finds its row, runs `info` and, for rows that are not rendered, `read`.
-// UnsupportedFormat (8) when no row matches, else the codec's own status; `picture` is null unless Ok.
-Status LoadPicture(const char* fileName, PicturePointer& picture, void* window = nullptr);
-// The first half of it: a record with the facts of a file. `flags` are handed to `info`. FileOpenError (1) for a path over
-// 260 characters.
-Status LoadPictureInfo(const char* fileName, PicturePointer& picture, uint32_t flags = 0);
-// The second half: decodes the page `picture.page` of the file that the record has the facts of. NoImages (20) when the
-// file has no such page, else the codec's own status; `image` and `alpha` are empty unless Ok.
-Status ReadPicture(PictureRecord& picture);
+// Opens and decodes what is asked for into a new record: finds its row, runs `info` and, for rows that are not rendered,
+// `read`. UnsupportedFormat (8) when no row matches, else the codec's own status; `picture` is null unless Ok.
+Status LoadPicture(const ReadRequest& request, PicturePointer& picture, void* window = nullptr);
+// The first half of it: a record with the facts of a file. FileOpenError (1) for a path over 260 characters.
+Status LoadPictureInfo(const ReadRequest& request, PicturePointer& picture);
+// The second half: decodes a page of the file that the record has the facts of. NoImages (20) when the file has no such
+// page, else the codec's own status; `image` and `alpha` are empty unless Ok.
+Status ReadPicture(const ReadRequest& request, PictureRecord& picture);
 
 // Opens the frames of a file, to be gone through in order; a still picture of such a format has one. UnsupportedFunction (5)
 // for formats without, else the codec's own status; `animation` is null unless Ok.
-Status OpenAnimation(const char* fileName, AnimationPointer& animation);
+Status OpenAnimation(const ReadRequest& request, AnimationPointer& animation);
 
 // Writes a picture to `destination` in the format of its extension. UnsupportedFormat (8) when no row matches,
 // TooManyColors (12) when the picture is deeper than the row takes, UnsupportedFunction (5) when the row cannot write,

@@ -2,10 +2,12 @@
 
 #include "core/text.h"
 #include "registry/registry.h"
+#include "settings/settings.h"
 
 namespace fotomill {
 
 void TakeFormatSwitches() {
+  TakePluginOverride();
   for (const int32_t index : FormatListRows()) FormatRow(index).enabled = EnabledByDefault(index);
   IniReader reader(ConfigurationText(), kFormatSection);
   for (IniEntry entry; reader.Next(entry);) {
@@ -15,6 +17,8 @@ void TakeFormatSwitches() {
     }
   }
 }
+
+void TakePluginOverride() { LetPluginsOverrideFormats(settings.AllowPluginFormatOverride != 0); }
 
 SaveResult SwitchFormat(int32_t index, bool on) {
   FormatEntry& row = FormatRow(index);

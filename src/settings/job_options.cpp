@@ -6,6 +6,8 @@
 #include "catalog/thumbnails/thumbnail_update.h"
 #include "metadata/exif/exif_text.h"
 #include "metadata/gps.h"
+#include "picture/encode_options.h"
+#include "picture/read_request.h"
 #include "processing/palette/reduce.h"
 #include "settings/configuration.h"
 #include "settings/key_table.h"
@@ -22,6 +24,34 @@ Dither DitherFromKey(int32_t value) { return value == 0 ? Dither::None : value =
 
 }  // namespace
 
+ReadOptions ReadOptionsFromSettings() {
+  return {.alphaChannels = settings.UseAlphaChannels != 0,
+          .recognizeApng = settings.RecognizeAPNG != 0,
+          .alphaBackground = static_cast<uint32_t>(settings.AlphaBackground)};
+}
+
+EncodeOptions EncodeOptionsFromSettings() {
+  return {.preserveMetadata = settings.PreserveEXIF != 0,
+          .resolution = settings.TiffResolution,
+          .bmpOs2 = settings.WriteOS2Bitmaps != 0,
+          .gifInterlaced = settings.WriteGIFInterlaced != 0,
+          .gif89 = settings.CreateGif89 != 0,
+          .hdpCompression = settings.HDPCompression,
+          .hdpBits = settings.HDPWriteOptions,
+          .iconCompression = settings.ICOCompression,
+          .jpegQuality = settings.JpegCompression,
+          .jpegSubsampling = settings.JpegSubsample,
+          .jpegProgressive = settings.WriteJpegProgressive != 0,
+          .jpegStoresResolution = settings.JpegStoreDPI != 0,
+          .macBinary = settings.CreateMacbinaryHeader != 0,
+          .pngCompression = settings.PngCompression,
+          .targa16 = settings.CreateTarga16 != 0,
+          .tiffCompression = settings.TiffOptions,
+          .webpLossless = settings.WebPLossless != 0,
+          .webpQuality = settings.WebPQualityFactor,
+          .webpMixed = settings.WebPAllowMixed != 0};
+}
+
 ReduceOptions ReduceOptionsFromSettings() {
   const int32_t grays = settings.FXGrayLevel;
   return {.colorDither = DitherFromKey(settings.FXColorDither),
@@ -36,9 +66,7 @@ ReduceOptions ReduceOptionsFromSettings() {
 
 ExifTextOptions ExifTextOptionsFromSettings() { return {.showTypes = settings.ExifShowTypes != 0}; }
 
-choice::DistanceUnit DistanceUnitFromSettings() {
-  return settings.ExifDistinceUnits == 0 ? choice::kMiles : choice::kKilometres;
-}
+choice::DistanceUnit DistanceUnitFromSettings() { return settings.ExifDistinceUnits == 0 ? choice::kMiles : choice::kKilometres; }
 
 bool GpsLocationFromSettings(GpsLocation& location) { return ParseGpsLocation(settings.ExifDefaultLocation, location); }
 
@@ -60,7 +88,8 @@ ThumbnailOptions ThumbnailOptionsFromSettings() {
           .fromSystem = settings.UseWindowsThumbnailCache != 0,
           .keep = settings.AutoCreateThumbnail != 0,
           .fastZoom = settings.FastZoomedThumbnails != 0,
-          .zoomFilter = settings.ThumbnailZoomFilter};
+          .zoomFilter = settings.ThumbnailZoomFilter,
+          .read = ReadOptionsFromSettings()};
 }
 
 ThumbnailUpdateOptions ThumbnailUpdateOptionsFromSettings() {

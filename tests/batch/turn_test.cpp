@@ -8,6 +8,7 @@
 #include "formats/png/png.h"
 #include "formats/webp/webp.h"
 #include "platform/files.h"
+#include "settings/job_options.h"
 #include "settings/settings.h"
 #include "support/bitmaps.h"
 #include "support/codecs.h"
@@ -54,7 +55,7 @@ TEST(Turn, FilesChangeOnlyWhereNothingIsLost) {
     WriteBytes(path, row.bytes);
     ASSERT_TRUE(platform::SetModificationTime(path, {1'000'000'000, 500}));
     const TurnRequest right{.turn = Orientation::QuarterRight, .keepTime = true};
-    const TurnedFile turned = TurnPictureFile(path, path, right, {});
+    const TurnedFile turned = TurnPictureFile(path, path, right, {}, {});
     EXPECT_EQ(platform::FactsOf(path).modified, 1'000'000'000);
     if (row.hint != nullptr) {
       EXPECT_NE(turned.status, Status::Ok);
@@ -66,8 +67,8 @@ TEST(Turn, FilesChangeOnlyWhereNothingIsLost) {
     EXPECT_TRUE(turned.note.empty());
     PicturePointer before, after;
     WriteBytes(folder.Path(std::string("before-") + row.name), row.bytes);
-    ASSERT_EQ(LoadPicture(folder.Path(std::string("before-") + row.name).c_str(), before), Status::Ok);
-    ASSERT_EQ(LoadPicture(path.c_str(), after), Status::Ok);
+    ASSERT_EQ(LoadPicture({.fileName = folder.Path(std::string("before-") + row.name)}, before), Status::Ok);
+    ASSERT_EQ(LoadPicture({.fileName = path}, after), Status::Ok);
     ASSERT_EQ(after->image.Width(), before->image.Height());
     if (std::string_view(row.name) == "a.jpg") continue;  // decoding a turned block rounds otherwise
     for (int32_t x = 0; x < before->image.Width(); ++x) {
@@ -94,7 +95,8 @@ TEST(Turn, AFileThatWouldLoseItsTextsStaysAsItIs) {
     for (const bool kept : {false, true}) {
       settings.PreserveEXIF = kept;
       WriteBytes(path, file);
-      const TurnedFile turned = TurnPictureFile(path, path, {.turn = Orientation::QuarterRight}, {});
+      const TurnedFile turned =
+          TurnPictureFile(path, path, {.turn = Orientation::QuarterRight}, {}, {.encode = EncodeOptionsFromSettings()});
       EXPECT_EQ(turned.status, kept ? Status::Ok : Status::UnsuitableImage);
       EXPECT_EQ(turned.hint, kept ? "" : row.hint);
       EXPECT_EQ(ReadBytes(path) == file, !kept);
@@ -131,12 +133,12 @@ TEST(Turn, SelectionsKeepTheirNamesAndTheirOldFiles) {
   other.destinationFolder = folder.Path("out");
   ASSERT_EQ(RunTurn(std::span(files).first(3), function, other), Status::Ok);
   PicturePointer twice, once;
-  ASSERT_EQ(LoadPicture(folder.Path("out/a.bmp").c_str(), twice), Status::Ok);
-  ASSERT_EQ(LoadPicture(folder.Path("c.bmp").c_str(), once), Status::Ok);
+  ASSERT_EQ(LoadPicture({.fileName = folder.Path("out/a.bmp")}, twice), Status::Ok);
+  ASSERT_EQ(LoadPicture({.fileName = folder.Path("c.bmp")}, once), Status::Ok);
   EXPECT_TRUE(SamePixels(once->image, twice->image));
   EXPECT_TRUE(fs::exists(folder.Path("out/a [1].bmp")));
   // A turn that comes to nothing leaves the file alone.
-  EXPECT_FALSE(TurnPictureFile(folder.Path("c.bmp"), folder.Path("c.bmp"), {}, {}).changed);
+  EXPECT_FALSE(TurnPictureFile(folder.Path("c.bmp"), folder.Path("c.bmp"), {}, {}, {}).changed);
 }
 
 TEST(Turn, WhateverFailsTheOldFileIsThere) {
@@ -145,7 +147,7 @@ TEST(Turn, WhateverFailsTheOldFileIsThere) {
   const std::vector<uint8_t> file = Encode(JpegWrite, *PatternPicture(32, 16, 24));
   WriteBytes(path, file);
   const int64_t faults = ForEachFault([&] {
-    const Status status = TurnPictureFile(path, path, {.turn = Orientation::HalfTurn}, {}).status;
+    const Status status = TurnPictureFile(path, path, {.turn = Orientation::HalfTurn}, {}, {}).status;
     EXPECT_EQ(ReadBytes(path) == file, status != Status::Ok);
     EXPECT_EQ(folder.Names().size(), 1u);
   });
@@ -155,14 +157,14 @@ TEST(Turn, WhateverFailsTheOldFileIsThere) {
     WriteText(path, "somebody's work");
     return true;
   };
-  EXPECT_NE(TurnPictureFile(path, path, {.turn = Orientation::HalfTurn}, options).status, Status::Ok);
+  EXPECT_NE(TurnPictureFile(path, path, {.turn = Orientation::HalfTurn}, {}, options).status, Status::Ok);
   // Neither does a text go that a new file would not have.
   std::vector<uint8_t> written = Encode(PngWrite, *PatternPicture(9, 5, 24));
   const std::vector<uint8_t> author = Hex("00000009 74455874 417574686F72004D65 00000000");
   written.insert(written.end() - 12, author.begin(), author.end());
   const std::string png = folder.Path("a.png");
   WriteBytes(png, written);
-  EXPECT_EQ(TurnPictureFile(png, png, {.turn = Orientation::HalfTurn}, {}).status, Status::UnsuitableImage);
+  EXPECT_EQ(TurnPictureFile(png, png, {.turn = Orientation::HalfTurn}, {}, {}).status, Status::UnsuitableImage);
   EXPECT_EQ(ReadBytes(png), written);
   EXPECT_EQ(ReadText(path), "somebody's work");
 }

@@ -65,7 +65,7 @@ TEST_F(FileDeedsTest, TurnsGiveTheFileBackAndTheirThumbnailsGo) {
   const std::string path = From("turned.bmp");
   test::WriteBytes(path, test::BitmapFile(9, 5, 24));
   const std::string old = ReadText(path);
-  ASSERT_EQ(WriteThumbnail(path), Status::Ok);
+  ASSERT_EQ(WriteThumbnail(path, {}), Status::Ok);
   DeedResult result = TurnOneFile(path, Orientation::QuarterRight);
   ASSERT_THAT(result.failures, IsEmpty());
   EXPECT_EQ(DeedName(result.done), "rotation of turned.bmp");
@@ -201,7 +201,7 @@ TEST_F(FileDeedsTest, APastedPictureTakesAFreeName) {
     ASSERT_EQ(result.done.steps.size(), 1u);
     EXPECT_EQ(result.done.steps[0].to, To(name));
     PicturePointer picture;
-    ASSERT_EQ(LoadPicture(To(name).c_str(), picture), Status::Ok);
+    ASSERT_EQ(LoadPicture({.fileName = To(name)}, picture), Status::Ok);
     EXPECT_EQ(picture->image.PixelAt(1, 0), 0x112233u);  // red first
     EXPECT_EQ(picture->alpha.PixelAt(1, 0), 7u);
   }

@@ -234,8 +234,8 @@ TEST(BmpInfo, FactsOfTheHeader) {
 
 TEST(BmpInfo, MissingFileDoesNotOpen) {
   PictureRecord picture;
-  EXPECT_EQ(BmpInfo(picture, "/nowhere/a.bmp", 0), Status::FileOpenError);
-  EXPECT_EQ(BmpRead(picture, "/nowhere/a.bmp"), Status::FileOpenError);
+  EXPECT_EQ(BmpInfo(picture, RequestFor("/nowhere/a.bmp")), Status::FileOpenError);
+  EXPECT_EQ(BmpRead(picture, RequestFor("/nowhere/a.bmp")), Status::FileOpenError);
   picture.fileName.AssignCut("/nowhere/a.bmp");
   EXPECT_EQ(BmpDetails(picture), Status::FileOpenError);
 }

@@ -127,7 +127,7 @@ void ExpectWellBehaved(const CountingSink& sink) {
 }
 
 Status InfoOf(const FormatEntry& row, const std::string& path, PictureRecord& picture) {
-  return row.info(picture, path.c_str(), 0);
+  return row.info(picture, RequestFor(path));
 }
 
 TEST(EveryCodec, ReadsBackWhatItWrote) {
@@ -149,7 +149,7 @@ TEST(EveryCodec, ReadsBackWhatItWrote) {
         sink = CountingSink();
         back->progress = &sink;
         ASSERT_EQ(InfoOf(row, path, *described), Status::Ok);
-        ASSERT_EQ(row.read(*back, path.c_str()), Status::Ok);
+        ASSERT_EQ(row.read(*back, RequestFor(path)), Status::Ok);
         fs::remove(path);
         ExpectWellBehaved(sink);
         EXPECT_GE(sink.steps, 35);
@@ -182,7 +182,7 @@ TEST(EveryCodec, KeepsAlphaThatItsRowPromises) {
     picture->fileName.AssignCut(path);
     ASSERT_EQ(row.write(*picture, {}), Status::Ok);
     const PicturePointer back = NewPictureRecord();
-    ASSERT_EQ(row.read(*back, path.c_str()), Status::Ok);
+    ASSERT_EQ(row.read(*back, RequestFor(path)), Status::Ok);
     if (KeepsOf(row) == Keeps::All) {
       EXPECT_EQ(Difference(picture->image, back->image), "");
     }
@@ -197,15 +197,15 @@ TEST(EveryCodec, ReadsGoodPictures) {
   for (const std::string& file : files) {
     SCOPED_TRACE(file);
     PicturePointer described, picture;
-    ASSERT_EQ(LoadPictureInfo(file.c_str(), described), Status::Ok);
-    ASSERT_EQ(LoadPicture(file.c_str(), picture), Status::Ok);
+    ASSERT_EQ(LoadPictureInfo(RequestFor(file), described), Status::Ok);
+    ASSERT_EQ(LoadPicture(RequestFor(file), picture), Status::Ok);
     EXPECT_EQ(described->width, picture->image.Width());
     EXPECT_EQ(described->height, picture->image.Height());
     const fs::path path(file);
     const fs::path reference = path.parent_path().parent_path() / "reference" / path.filename().replace_extension(".bmp");
     if (!fs::exists(reference)) continue;
     PicturePointer expected;
-    ASSERT_EQ(LoadPicture(reference.c_str(), expected), Status::Ok);
+    ASSERT_EQ(LoadPicture(RequestFor(reference), expected), Status::Ok);
     EXPECT_EQ(Difference(expected->image, picture->image), "");
   }
 }
@@ -221,7 +221,7 @@ TEST(EveryCodec, RefusesBadPictures) {
     const int32_t row = FindFormatByName(file);
     ASSERT_NE(row, kNoFormat);
     const PicturePointer picture = NewPictureRecord();
-    EXPECT_EQ(StatusNumber(FormatRow(row).read(*picture, file.c_str())), status);
+    EXPECT_EQ(StatusNumber(FormatRow(row).read(*picture, RequestFor(file))), status);
     EXPECT_TRUE(picture->image.Empty());
     EXPECT_TRUE(picture->alpha.Empty());
   }
@@ -235,14 +235,14 @@ void ExpectClean(const FormatEntry& row, const std::string& path) {
   if (described == Status::Ok && row.details != nullptr) (void)row.details(*picture);
   CountingSink sink;
   picture->progress = &sink;
-  const Status status = row.read(*picture, path.c_str());
+  const Status status = row.read(*picture, RequestFor(path));
   ExpectWellBehaved(sink);
   EXPECT_EQ(picture->image.Empty(), status != Status::Ok);
   if (status != Status::Ok) {
     EXPECT_TRUE(picture->alpha.Empty());
   }
   AnimationPointer animation;
-  if (row.animate == nullptr || row.animate(path.c_str(), animation) != Status::Ok) return;
+  if (row.animate == nullptr || row.animate(RequestFor(path), animation) != Status::Ok) return;
   size_t frames = 0;
   while (animation->Next() == Status::Ok) ++frames;
   EXPECT_LE(frames, animation->Delays().size());
@@ -303,7 +303,7 @@ TEST(EveryCodec, ReadsOrRefusesRealPictures) {
     const FormatEntry& row = FormatRow(index);
     const PicturePointer described = NewPictureRecord(), picture = NewPictureRecord();
     const Status info = InfoOf(row, path, *described);
-    const Status read = row.read(*picture, path.c_str());
+    const Status read = row.read(*picture, RequestFor(path));
     EXPECT_EQ(picture->image.Empty(), read != Status::Ok);
     if (read != Status::Ok) continue;
     EXPECT_EQ(info, Status::Ok);

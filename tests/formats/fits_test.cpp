@@ -145,13 +145,13 @@ TEST(Fits, ReadsHeaders) {
     SCOPED_TRACE(row.name);
     WriteText(path, row.file);
     const PicturePointer picture = NewPictureRecord();
-    EXPECT_EQ(FitsInfo(*picture, path.c_str(), 0), row.info);
+    EXPECT_EQ(FitsInfo(*picture, {.fileName = path}), row.info);
     if (row.info == kOk) {
       EXPECT_EQ(picture->typeName.view(), row.typeName);
       EXPECT_EQ(picture->imageBytes, (uint64_t(row.width) + 7) / 8 * 8 * uint64_t(row.height));
       EXPECT_EQ(picture->fileSize, row.file.size());
     }
-    EXPECT_EQ(FitsRead(*picture, path.c_str()), row.read);
+    EXPECT_EQ(FitsRead(*picture, {.fileName = path}), row.read);
     EXPECT_EQ(picture->image.Empty(), row.read != kOk);
     EXPECT_EQ(row.width == 0 ? 0 : picture->width, row.width);
     EXPECT_EQ(row.height == 0 ? 0 : picture->height, row.height);
@@ -173,8 +173,8 @@ TEST(Fits, FindsTheEndOfTheHeader) {
     file.resize((file.size() + 2879) / 2880 * 2880, ' ');
     WriteText(path, file + "a");
     const PicturePointer picture = NewPictureRecord();
-    EXPECT_EQ(FitsInfo(*picture, path.c_str(), 0), Status::Ok);
-    ASSERT_EQ(FitsRead(*picture, path.c_str()), row.read);
+    EXPECT_EQ(FitsInfo(*picture, {.fileName = path}), Status::Ok);
+    ASSERT_EQ(FitsRead(*picture, {.fileName = path}), row.read);
     EXPECT_EQ(picture->image.PixelAt(0, 0), row.read == Status::Ok ? 'a' : -1);
   }
 }
@@ -198,7 +198,7 @@ TEST(Fits, ShowsTheBytesOfEachRowAsTheyAre) {
     SCOPED_TRACE(row.name);
     WriteText(path, Header(std::string(row.cards) + "|NAXIS2=2|BZERO=100|BSCALE=3") + row.data);
     const PicturePointer picture = NewPictureRecord();
-    ASSERT_EQ(FitsRead(*picture, path.c_str()), Status::Ok);
+    ASSERT_EQ(FitsRead(*picture, {.fileName = path}), Status::Ok);
     EXPECT_EQ(picture->palette, GrayRamp());
     const auto top = picture->image.Row(0), bottom = picture->image.Row(1);
     EXPECT_EQ(Bytes(top.begin(), top.end()), row.top);
@@ -234,12 +234,12 @@ TEST(Fits, AgreesWithNetpbm) {
   const PicturePointer picture = MakePicture(37, 29, 24, rows), own = NewPictureRecord(), again = NewPictureRecord();
   picture->fileName.AssignCut(ours);
   ASSERT_EQ(FitsWrite(*picture, {}), Status::Ok);
-  ASSERT_EQ(FitsRead(*own, ours.c_str()), Status::Ok);
+  ASSERT_EQ(FitsRead(*own, {.fileName = ours}), Status::Ok);
   ASSERT_TRUE(RunShell("fitstopnm -min 0 -max 255 " + ours + " > " + seen));
   EXPECT_EQ(ReadPnm(seen).values, RowsOf(own->image));
   ASSERT_TRUE(RunShell("pamtofits " + seen + " > " + theirs));
-  ASSERT_EQ(FitsInfo(*again, theirs.c_str(), 0), Status::Ok);
-  ASSERT_EQ(FitsRead(*again, theirs.c_str()), Status::Ok);
+  ASSERT_EQ(FitsInfo(*again, {.fileName = theirs}), Status::Ok);
+  ASSERT_EQ(FitsRead(*again, {.fileName = theirs}), Status::Ok);
   EXPECT_EQ(RowsOf(again->image), RowsOf(own->image));
 }
 

@@ -88,12 +88,12 @@ TEST(GifRead, LaterFramesStandOnTheOnesBefore) {
     TemporaryFolder folder;
     WriteBytes(folder.Path("a.gif"), file(row.disposal));
     const PicturePointer picture = NewPictureRecord();
-    picture->page = 2;
-    ASSERT_EQ(GifRead(*picture, folder.Path("a.gif").c_str()), Status::Ok);
+    ReadRequest request{.fileName = folder.Path("a.gif"), .page = 2};
+    ASSERT_EQ(GifRead(*picture, request), Status::Ok);
     EXPECT_EQ(PixelText(picture->image), row.pixels);
     EXPECT_EQ(PixelText(picture->alpha), row.alpha);
-    picture->page = 3;
-    EXPECT_EQ(GifRead(*picture, folder.Path("a.gif").c_str()), Status::NoImages);
+    request.page = 3;
+    EXPECT_EQ(GifRead(*picture, request), Status::NoImages);
   }
 }
 

@@ -46,7 +46,7 @@ TEST(Hdp, QuantizerZeroKeepsEveryPixelAndOthersStayClose) {
       WriteBytes(folder.Path("a.wdp"), file);
       ASSERT_TRUE(RunShell("JxrDecApp -i " + folder.Path("a.wdp") + " -o " + folder.Path("a.bmp") + " > " + folder.Path("log")));
       PicturePointer peer;
-      ASSERT_EQ(LoadPicture(folder.Path("a.bmp").c_str(), peer), Status::Ok);
+      ASSERT_EQ(LoadPicture(RequestFor(folder.Path("a.bmp")), peer), Status::Ok);
       EXPECT_TRUE(SamePixels(peer->image, back.picture->image));
     }
   }

@@ -68,8 +68,7 @@ TEST(IcoRead, TheLargestThenDeepestEntryWinsAndPagesSelect) {
   const char* const pixels[] = {"030201 060504", "0 1", "0C0B0A"};
   for (int32_t page = 0; page < 3; ++page) {
     const PicturePointer picture = NewPictureRecord();
-    picture->page = page;
-    ASSERT_EQ(IcoRead(*picture, folder.Path("a.cur").c_str()), Status::Ok);
+    ASSERT_EQ(IcoRead(*picture, {.fileName = folder.Path("a.cur"), .page = page}), Status::Ok);
     EXPECT_EQ(PixelText(picture->image), pixels[page]) << page;
     EXPECT_EQ(picture->pageCount, 3);
     EXPECT_EQ(picture->hotSpotY, page == 0 ? 4 : 0);

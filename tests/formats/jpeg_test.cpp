@@ -108,8 +108,9 @@ TEST(Jpeg, FaultsThatArePassedOverAreTold) {
 Bytes OneBlock(const char* frame, const Bytes& scans) {
   Bytes file = Hex("FFD8  FFDB 0043 00");
   file.insert(file.end(), 64, 8);  // every step is 8, so that a coefficient is the value less 128
-  const Bytes tables = Hex("FFC4 0016 00 010101 00000000000000000000000000 070800"
-                           "FFC4 0014 10 01 000000000000000000000000000000 00");
+  const Bytes tables =
+      Hex("FFC4 0016 00 010101 00000000000000000000000000 070800"
+          "FFC4 0014 10 01 000000000000000000000000000000 00");
   for (const Bytes& part : {tables, Hex(frame), scans, Hex("FFD9")}) file.insert(file.end(), part.begin(), part.end());
   return file;
 }
@@ -160,8 +161,7 @@ TEST(Jpeg, ThumbnailsDecodeAtTheSmallestSizeThatServes) {
   for (const Row& row : {Row{0, 800}, Row{96, 200}, Row{50, 100}, Row{10, 100}, Row{201, 800}, Row{200, 400}}) {
     SCOPED_TRACE(row.side);
     const PicturePointer picture = NewPictureRecord();
-    picture->thumbnailSide = row.side;
-    ASSERT_EQ(JpegRead(*picture, folder.Path("a.jpg").c_str()), Status::Ok);
+    ASSERT_EQ(JpegRead(*picture, {.fileName = folder.Path("a.jpg"), .thumbnailSide = row.side}), Status::Ok);
     EXPECT_EQ(picture->image.Width(), row.width);
     EXPECT_EQ(picture->width, 800);
   }

@@ -5,6 +5,7 @@
 #include <ctime>
 
 #include "platform/clock.h"
+#include "settings/job_options.h"
 #include "support/files.h"
 #include "support/hex.h"
 #include "support/peers.h"
@@ -40,8 +41,8 @@ Bytes WhiteRows(size_t count) {
 }
 
 Status ReadFile(const std::string& path, PictureRecord& picture) {
-  RETURN_IF_BAD(MacInfo(picture, path.c_str(), 0));
-  return MacRead(picture, path.c_str());
+  RETURN_IF_BAD(MacInfo(picture, {.fileName = path}));
+  return MacRead(picture, {.fileName = path});
 }
 
 TEST(Mac, PacksRows) {
@@ -60,7 +61,7 @@ TEST(Mac, PacksRows) {
     SCOPED_TRACE(row.name);
     const PicturePointer picture = MakePicture(576, 1, 1, {row.row});
     ASSERT_TRUE(picture->fileName.Assign(folder.Path("row.mac")));
-    ASSERT_EQ(MacWrite(*picture, {}), Status::Ok);
+    ASSERT_EQ(MacWrite(*picture, {.encode = EncodeOptionsFromSettings()}), Status::Ok);
     const Bytes written = ReadBytes(folder.Path("row.mac"));
     EXPECT_EQ(Bytes(written.begin() + kHeader, written.end()), Join({row.packed, WhiteRows(719)}));
   }
@@ -143,7 +144,7 @@ TEST(Mac, MacBinaryHeaderIsTheSameInEveryTimeZone) {
     tzset();
     const PicturePointer picture = MakePicture(8, 720, 1);
     ASSERT_TRUE(picture->fileName.Assign(path));
-    ASSERT_EQ(MacWrite(*picture, {}), Status::Ok);
+    ASSERT_EQ(MacWrite(*picture, {.encode = EncodeOptionsFromSettings()}), Status::Ok);
     const Bytes written = ReadBytes(path);
     ASSERT_EQ(written.size(), 128u + 512 + 720 * 4);
     EXPECT_EQ(Bytes(written.begin(), written.begin() + 2), Hex("00 26"));  // version, length of the name
@@ -170,13 +171,13 @@ TEST(Mac, NamesAreCutTo63) {
   const std::string name(90, 'a'), path = folder.Path(name + ".mac");
   const PicturePointer picture = MakePicture(8, 8, 1);
   ASSERT_TRUE(picture->fileName.Assign(path));
-  ASSERT_EQ(MacWrite(*picture, {}), Status::Ok);
+  ASSERT_EQ(MacWrite(*picture, {.encode = EncodeOptionsFromSettings()}), Status::Ok);
   Bytes written = ReadBytes(path);
   EXPECT_EQ(written[1], 63);
   EXPECT_EQ(std::string(written.begin() + 65, written.begin() + 69), "PNTG");
   written[1] = 255;  // a length that the field cannot hold
   WriteBytes(path, written);
-  ASSERT_EQ(MacInfo(*picture, path.c_str(), 0), Status::Ok);
+  ASSERT_EQ(MacInfo(*picture, {.fileName = path}), Status::Ok);
   EXPECT_EQ(picture->typeName.view(), "A" + std::string(62, 'a'));
 }
 
@@ -188,7 +189,7 @@ TEST(Mac, PutsThePictureOnAWhitePage) {
       SCOPED_TRACE(std::to_string(width) + " x " + std::to_string(height));
       const PicturePointer picture = MakePicture(width, height, 1);  // black, its padding too
       ASSERT_TRUE(picture->fileName.Assign(path));
-      ASSERT_EQ(MacWrite(*picture, {}), Status::Ok);
+      ASSERT_EQ(MacWrite(*picture, {.encode = EncodeOptionsFromSettings()}), Status::Ok);
       const PicturePointer again = NewPictureRecord();
       ASSERT_EQ(ReadFile(path, *again), Status::Ok);
       const int32_t right = std::min(width, 576), bottom = std::min(height, 720);
@@ -204,11 +205,11 @@ TEST(Mac, PutsThePictureOnAWhitePage) {
 TEST(Mac, RefusesWithItsStatus) {
   const TemporaryFolder folder;
   const PicturePointer picture = MakePicture(8, 8, 8);
-  EXPECT_EQ(MacInfo(*picture, folder.Path("none.mac").c_str(), 0x200), Status::UnsupportedFormat);
-  EXPECT_EQ(MacInfo(*picture, folder.Path("none.mac").c_str(), 0), Status::FileOpenError);
-  EXPECT_EQ(MacInfo(*picture, folder.Path().c_str(), 0), Status::FileOpenError);
+  EXPECT_EQ(MacInfo(*picture, {.fileName = folder.Path("none.mac"), .signedOnly = true}), Status::UnsupportedFormat);
+  EXPECT_EQ(MacInfo(*picture, {.fileName = folder.Path("none.mac")}), Status::FileOpenError);
+  EXPECT_EQ(MacInfo(*picture, {.fileName = folder.Path()}), Status::FileOpenError);
   ASSERT_TRUE(picture->fileName.Assign(folder.Path("deep.mac")));
-  EXPECT_EQ(MacWrite(*picture, {}), Status::TooManyColors);
+  EXPECT_EQ(MacWrite(*picture, {.encode = EncodeOptionsFromSettings()}), Status::TooManyColors);
   const PicturePointer flat = MakePicture(8, 8, 1);
   ASSERT_TRUE(flat->fileName.Assign(folder.Path("none/flat.mac")));
   EXPECT_EQ(MacWrite(*flat, {}), Status::ErrorCreatingFile);
@@ -228,7 +229,7 @@ TEST(Mac, AgreesWithNetpbm) {
   for (const int32_t macBinary : {0, 1}) {
     SCOPED_TRACE(macBinary);
     settings.CreateMacbinaryHeader = macBinary;
-    ASSERT_EQ(MacWrite(*picture, {}), Status::Ok);
+    ASSERT_EQ(MacWrite(*picture, {.encode = EncodeOptionsFromSettings()}), Status::Ok);
     ASSERT_TRUE(RunShell("macptopbm " + ours + " > " + seen));
     const PnmPicture pnm = ReadPnm(seen);
     ASSERT_EQ(pnm.values.size(), size_t{576 * 720});

@@ -125,8 +125,8 @@ TEST(PcxInfo, DepthSizeAndEstimate) {
     EXPECT_EQ(Decode(PcxRead, file).status, Status::DamagedFile);
   }
   PictureRecord picture;
-  EXPECT_EQ(PcxInfo(picture, "/nowhere/a.pcx", 0), Status::FileOpenError);
-  EXPECT_EQ(PcxRead(picture, "/nowhere/a.pcx"), Status::FileOpenError);
+  EXPECT_EQ(PcxInfo(picture, RequestFor("/nowhere/a.pcx")), Status::FileOpenError);
+  EXPECT_EQ(PcxRead(picture, RequestFor("/nowhere/a.pcx")), Status::FileOpenError);
 }
 
 TEST(PcxInfo, PaletteByVersionAndDepth) {

@@ -84,8 +84,7 @@ TEST(Webp, FramesAreDrawnOverEachOther) {
     SCOPED_TRACE(row.page);
     WriteBytes(folder.Path("a.webp"), row.file);
     const PicturePointer picture = NewPictureRecord();
-    picture->page = row.page;
-    ASSERT_EQ(WebpRead(*picture, folder.Path("a.webp").c_str()), row.status);
+    ASSERT_EQ(WebpRead(*picture, {.fileName = folder.Path("a.webp"), .page = row.page}), row.status);
     EXPECT_EQ(picture->pageCount, 3);
     if (row.status != Status::Ok) continue;
     const auto at = [&](int32_t x) {

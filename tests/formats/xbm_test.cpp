@@ -17,8 +17,8 @@ using namespace test;
 using Bytes = std::vector<uint8_t>;
 
 Status ReadFile(const std::string& path, PictureRecord& picture) {
-  RETURN_IF_BAD(XbmInfo(picture, path.c_str(), 0));
-  return XbmRead(picture, path.c_str());
+  RETURN_IF_BAD(XbmInfo(picture, {.fileName = path}));
+  return XbmRead(picture, {.fileName = path});
 }
 
 std::string WithLineEnds(std::string_view text) {
@@ -137,14 +137,14 @@ TEST(Xbm, ReadsText) {
     WriteText(path, row.text);
     const PicturePointer picture = NewPictureRecord();
     picture->typeName.AssignCut("stale");
-    ASSERT_EQ(XbmInfo(*picture, path.c_str(), 0), Status::Ok);
+    ASSERT_EQ(XbmInfo(*picture, {.fileName = path}), Status::Ok);
     EXPECT_EQ(picture->width, row.width);
     EXPECT_EQ(picture->height, row.height);
     EXPECT_EQ(picture->bitsPerPixel, 1);
     EXPECT_EQ(picture->imageBytes, (uint64_t(row.width) + 7) / 8 * uint64_t(row.height));
     EXPECT_EQ(picture->fileSize, row.text.size());
     EXPECT_TRUE(picture->typeName.empty());
-    ASSERT_EQ(XbmRead(*picture, path.c_str()), row.rows.empty() ? Status::DamagedFile : Status::Ok);
+    ASSERT_EQ(XbmRead(*picture, {.fileName = path}), row.rows.empty() ? Status::DamagedFile : Status::Ok);
     EXPECT_EQ(picture->image.Empty() ? Bytes() : RowsOf(picture->image), row.rows);
   }
 }
@@ -171,13 +171,13 @@ TEST(Xbm, RefusesSizes) {
     SCOPED_TRACE(row.name);
     WriteText(path, row.text + "static char a_bits[] = {\n0x80\n");
     const PicturePointer picture = NewPictureRecord();
-    EXPECT_EQ(XbmInfo(*picture, path.c_str(), 0), Status::DamagedFile);
-    EXPECT_EQ(XbmRead(*picture, path.c_str()), Status::DamagedFile);
+    EXPECT_EQ(XbmInfo(*picture, {.fileName = path}), Status::DamagedFile);
+    EXPECT_EQ(XbmRead(*picture, {.fileName = path}), Status::DamagedFile);
     EXPECT_TRUE(picture->image.Empty());
   }
   const PicturePointer picture = MakePicture(8, 8, 4);
-  EXPECT_EQ(XbmInfo(*picture, folder.Path("none.xbm").c_str(), 0x200), Status::UnsupportedFormat);
-  EXPECT_EQ(XbmInfo(*picture, folder.Path("none.xbm").c_str(), 0), Status::FileOpenError);
+  EXPECT_EQ(XbmInfo(*picture, {.fileName = folder.Path("none.xbm"), .signedOnly = true}), Status::UnsupportedFormat);
+  EXPECT_EQ(XbmInfo(*picture, {.fileName = folder.Path("none.xbm")}), Status::FileOpenError);
   ASSERT_TRUE(picture->fileName.Assign(folder.Path("deep.xbm")));
   EXPECT_EQ(XbmWrite(*picture, {}), Status::TooManyColors);
   EXPECT_EQ(folder.Names(), std::vector<std::string>{"size.xbm"});
@@ -246,9 +246,9 @@ TEST(Xbm, ReadsTheBitmapsOfXAsNetpbmDoes) {
   for (const auto& entry : std::filesystem::directory_iterator(bitmaps)) {
     SCOPED_TRACE(entry.path());
     const PicturePointer picture = NewPictureRecord();
-    if (XbmInfo(*picture, entry.path().c_str(), 0) != Status::Ok || picture->width % 8 != 0) continue;
+    if (XbmInfo(*picture, {.fileName = entry.path().string()}) != Status::Ok || picture->width % 8 != 0) continue;
     if (!RunShell("xbmtopbm " + entry.path().string() + " > " + seen)) continue;
-    ASSERT_EQ(XbmRead(*picture, entry.path().c_str()), Status::Ok);
+    ASSERT_EQ(XbmRead(*picture, {.fileName = entry.path().string()}), Status::Ok);
     const PnmPicture pnm = ReadPnm(seen);
     ASSERT_EQ(pnm.width, picture->width);
     ASSERT_EQ(pnm.height, picture->height);

@@ -49,9 +49,6 @@ THREAD = re.compile(r"std::(j?thread\b(?!::)|async\b)|\bpthread_create\b|\bwxThr
 THREAD_FOLDERS = ("src/core/workers/worker_pool.", "src/platform/")
 INCLUDE = re.compile(r'\s*#\s*include\s*(["<])([^">]+)[">]')
 
-# Rooms whose code still reads the settings itself; they lose their place here one by one.
-NOT_YET_ON_OPTIONS = {"formats", "picture", "registry"}
-
 # Rooms above the settings that know them in one place only, where jobs are made.
 SETTINGS_DOORS = {"batch": {"batch/new_job.cpp"}, "pages": set()}
 
@@ -79,8 +76,6 @@ def include_breaches(path, line):
     in_system_folder = any(f"src/{path}".startswith(folder + "/") for folder in SYSTEM_FOLDERS)
     if quoted and other not in FLOOR:
         yield f'"{target}" is not named from src/ with its room'
-    elif quoted and other == "settings" and own in NOT_YET_ON_OPTIONS:
-        pass
     elif quoted and other == "settings" and own in SETTINGS_DOORS and path not in SETTINGS_DOORS[own]:
         yield f"{own} may not include settings ({target}); a job gets what it needs where it is made"
     elif quoted and other != own and FLOOR[other] >= FLOOR.get(own, -1):

@@ -111,7 +111,7 @@ TEST_F(Plugins, WhatAModuleReturnsIsChecked) {
     SCOPED_TRACE(row.module);
     EnablePlugins(OddFolder(row.module));
     PicturePointer picture;
-    EXPECT_EQ(LoadPicture(file.c_str(), picture), row.status);
+    EXPECT_EQ(LoadPicture({.fileName = file}, picture), row.status);
     EXPECT_EQ(picture != nullptr, row.status == Status::Ok);
   }
 }
@@ -127,7 +127,7 @@ TEST_F(Plugins, AFailedWriteLeavesTheDestinationAlone) {
     const std::string file = folder_.Path("x.odd");
     test::WriteText(file, "before");
     PicturePointer picture;
-    ASSERT_EQ(LoadPicture(file.c_str(), picture), Status::Ok);
+    ASSERT_EQ(LoadPicture({.fileName = file}, picture), Status::Ok);
     EXPECT_EQ(picture->typeName.view(), std::string(64, 'T'));
     EXPECT_EQ(picture->image.PixelAt(0, 0), 0x0000ff);
     EXPECT_EQ(picture->image.PixelAt(1, 0), 0xff0000);
@@ -141,7 +141,7 @@ TEST_F(Plugins, OlderModulesFillLess) {
   EnablePlugins(OddFolder("OLDER"));
   test::WriteText(folder_.Path("x.odd"), "");
   PicturePointer picture;
-  ASSERT_EQ(LoadPicture(folder_.Path("x.odd").c_str(), picture), Status::Ok);
+  ASSERT_EQ(LoadPicture({.fileName = folder_.Path("x.odd")}, picture), Status::Ok);
   EXPECT_EQ(picture->typeName.view().find('T'), std::string_view::npos);
   EXPECT_EQ(picture->background, 0x102030u);
   EXPECT_EQ(picture->width, 2);
@@ -156,10 +156,9 @@ TEST_F(Plugins, ProgressIsThatOfTheOuterCallAgainAfterAnInnerOne) {
   EnablePlugins(OddFolder("LOADS_ANOTHER"));
   for (const char* name : {"x.odd", "inner.odd"}) test::WriteText(folder_.Path(name), "");
   PicturePointer picture;
-  ASSERT_EQ(LoadPictureInfo(folder_.Path("x.odd").c_str(), picture), Status::Ok);
+  ASSERT_EQ(LoadPictureInfo({.fileName = folder_.Path("x.odd")}, picture), Status::Ok);
   Sink sink;
-  picture->progress = &sink;
-  EXPECT_EQ(ReadPicture(*picture), Status::Ok);
+  EXPECT_EQ(ReadPicture({.fileName = folder_.Path("x.odd"), .progress = &sink}, *picture), Status::Ok);
   EXPECT_EQ(sink.steps, (std::vector<std::pair<int32_t, int32_t>>{{1, 2}}));
 }
 
@@ -167,7 +166,7 @@ TEST_F(Plugins, AModuleWithoutWriterIsReadOnly) {
   EnablePlugins(OddFolder("GAPS_IN_LIST"));
   test::WriteText(folder_.Path("x.abc"), "");
   PicturePointer picture;
-  ASSERT_EQ(LoadPicture(folder_.Path("x.abc").c_str(), picture), Status::Ok);
+  ASSERT_EQ(LoadPicture({.fileName = folder_.Path("x.abc")}, picture), Status::Ok);
   EXPECT_EQ(WritePicture(*picture, folder_.Path("y.def"), {}), Status::UnsupportedFunction);
   for (const std::string& extension : DestinationExtensions()) EXPECT_NE(extension, "def");
 }
@@ -190,7 +189,7 @@ TEST_F(Plugins, SampleModuleReadsEveryKind) {
     SCOPED_TRACE(row.name);
     test::WriteText(folder_.Path(row.name), row.contents);
     PicturePointer picture;
-    ASSERT_EQ(LoadPicture(folder_.Path(row.name).c_str(), picture), Status::Ok);
+    ASSERT_EQ(LoadPicture({.fileName = folder_.Path(row.name)}, picture), Status::Ok);
     EXPECT_EQ(picture->bitsPerPixel, row.bits);
     for (size_t x = 0; x < row.pixels.size(); ++x) {
       EXPECT_EQ(picture->image.PixelAt(static_cast<int32_t>(x), 0), row.pixels[x]) << "column " << x;
@@ -198,16 +197,16 @@ TEST_F(Plugins, SampleModuleReadsEveryKind) {
   }
   PicturePointer picture;
   test::WriteText(folder_.Path("short.ppm"), "P6 9 9 255\nabc");
-  EXPECT_EQ(LoadPicture(folder_.Path("short.ppm").c_str(), picture), Status::FileReadError);
+  EXPECT_EQ(LoadPicture({.fileName = folder_.Path("short.ppm")}, picture), Status::FileReadError);
   test::WriteText(folder_.Path("huge.ppm"), "P6 99999999 99999999 255\n");
-  EXPECT_EQ(LoadPicture(folder_.Path("huge.ppm").c_str(), picture), Status::MemoryAllocationError);
+  EXPECT_EQ(LoadPicture({.fileName = folder_.Path("huge.ppm")}, picture), Status::MemoryAllocationError);
 }
 
 TEST_F(Plugins, OnePluginFormatConvertsToAnother) {
   EnablePlugins(SAMPLE_MODULES);
   test::WriteText(folder_.Path("a.ppm"), "P6\n# kept\n2 1\n255\n\x01\x02\x03\xff\xfe\xfd");
   PicturePointer picture;
-  ASSERT_EQ(LoadPicture(folder_.Path("a.ppm").c_str(), picture), Status::Ok);
+  ASSERT_EQ(LoadPicture({.fileName = folder_.Path("a.ppm")}, picture), Status::Ok);
   EXPECT_EQ(picture->formatIndex, kSpareRow);
   EXPECT_EQ(std::string(picture->comment.begin(), picture->comment.end()), "kept");
   WriteOptions commented;

@@ -8,10 +8,8 @@
 #include <set>
 
 #include "settings/key_table.h"
-#include "settings/settings.h"
 #include "support/files.h"
 #include "support/pictures.h"
-#include "support/scoped_settings.h"
 
 namespace fotomill::test {
 namespace {
@@ -58,13 +56,12 @@ TEST(FindFormat, FirstRowThatMatchesWins) {
       {"x.wllppr", 40, 40},
       {"x.b\xc3\xa4p", kNone, kNone},
   };
-  const ScopedSettings keep;
   for (const auto& row : rows) {
     SCOPED_TRACE(row.name);
-    settings.AllowPluginFormatOverride = 0;
     EXPECT_EQ(FindFormatByName(row.name), row.row);
-    settings.AllowPluginFormatOverride = 1;
+    LetPluginsOverrideFormats(true);
     EXPECT_EQ(FindFormatByName(row.name), row.rowWithPlugins);
+    LetPluginsOverrideFormats(false);
   }
 }
 
@@ -198,13 +195,13 @@ TEST(LoadPicture, NoRecordWithoutAPicture) {
   const TemporaryFolder folder;
   WriteText(folder.Path("x.bmp"), "BM");
   PicturePointer picture = NewPictureRecord();
-  EXPECT_EQ(LoadPicture(folder.Path("x.abc").c_str(), picture), Status::UnsupportedFormat);
+  EXPECT_EQ(LoadPicture({.fileName = folder.Path("x.abc")}, picture), Status::UnsupportedFormat);
   EXPECT_EQ(picture, nullptr);
-  EXPECT_EQ(LoadPicture(folder.Path("none.bmp").c_str(), picture), Status::FileOpenError);
-  EXPECT_EQ(LoadPicture(folder.Path("x.png").c_str(), picture) == Status::Ok, false);
-  EXPECT_NE(LoadPicture(folder.Path("x.bmp").c_str(), picture), Status::Ok);
+  EXPECT_EQ(LoadPicture({.fileName = folder.Path("none.bmp")}, picture), Status::FileOpenError);
+  EXPECT_EQ(LoadPicture({.fileName = folder.Path("x.png")}, picture) == Status::Ok, false);
+  EXPECT_NE(LoadPicture({.fileName = folder.Path("x.bmp")}, picture), Status::Ok);
   EXPECT_EQ(picture, nullptr);
-  EXPECT_EQ(ReadPicture(*NewPictureRecord()), Status::UnsupportedFormat);
+  EXPECT_EQ(ReadPicture({}, *NewPictureRecord()), Status::UnsupportedFormat);
 }
 
 // The rows that loops and codecs rely on.

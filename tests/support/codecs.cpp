@@ -2,6 +2,7 @@
 
 #include <cstdio>
 
+#include "settings/job_options.h"
 #include "support/files.h"
 
 namespace fotomill::test {
@@ -17,24 +18,26 @@ std::string NameOf(const TemporaryFolder& folder, std::span<const uint8_t> file)
 
 }  // namespace
 
+ReadRequest RequestFor(const std::string& fileName) { return {.fileName = fileName, .options = ReadOptionsFromSettings()}; }
+
 Decoded Describe(InfoOperation info, std::span<const uint8_t> file) {
   const TemporaryFolder folder;
   Decoded result{Status::Ok, NewPictureRecord()};
-  result.status = info(*result.picture, NameOf(folder, file).c_str(), 0);
+  result.status = info(*result.picture, RequestFor(NameOf(folder, file)));
   return result;
 }
 
 Decoded Decode(ReadOperation read, std::span<const uint8_t> file) {
   const TemporaryFolder folder;
   Decoded result{Status::Ok, NewPictureRecord()};
-  result.status = read(*result.picture, NameOf(folder, file).c_str());
+  result.status = read(*result.picture, RequestFor(NameOf(folder, file)));
   return result;
 }
 
 std::vector<uint8_t> Encode(WriteOperation write, PictureRecord& picture, Status* status) {
   const TemporaryFolder folder;
   picture.fileName.AssignCut(folder.Path("written"));
-  const Status result = write(picture, {});
+  const Status result = write(picture, {.encode = EncodeOptionsFromSettings()});
   if (status != nullptr) *status = result;
   return result == Status::Ok ? ReadBytes(folder.Path("written")) : std::vector<uint8_t>{};
 }

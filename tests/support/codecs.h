@@ -9,6 +9,9 @@
 
 namespace fotomill::test {
 
+// A file, to be read as the settings in force say.
+ReadRequest RequestFor(const std::string& fileName);
+
 // What an operation made of a file of these bytes.
 struct Decoded {
   Status status;
@@ -17,7 +20,7 @@ struct Decoded {
 Decoded Describe(InfoOperation info, std::span<const uint8_t> file);
 Decoded Decode(ReadOperation read, std::span<const uint8_t> file);
 
-// The bytes that a writer makes of a picture; empty when it fails, with its status in `status`.
+// The bytes that a writer makes of a picture as the settings in force say; empty when it fails, with its status in `status`.
 std::vector<uint8_t> Encode(WriteOperation write, PictureRecord& picture, Status* status = nullptr);
 
 // Pixels from the top, values by spaces and rows by " / ": decimal indices, or RRGGBB in hexadecimal. Empty without an

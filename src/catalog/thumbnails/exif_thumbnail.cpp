@@ -12,14 +12,14 @@ Status DecodeExifThumbnail(std::span<const uint8_t> bytes, PicturePointer& pictu
   platform::TemporaryFile file;
   if (!file.Create(".JPG")) return Status::ErrorCreatingFile;
   if (!file.Write(bytes)) return Status::ErrorWritingFile;
-  return LoadPicture(file.Path().c_str(), picture);
+  return LoadPicture({.fileName = file.Path()}, picture);
 }
 
-Status EncodeExifThumbnail(PictureRecord& picture, std::vector<uint8_t>& bytes) {
+Status EncodeExifThumbnail(PictureRecord& picture, const EncodeOptions& options, std::vector<uint8_t>& bytes) {
   bytes.clear();
   platform::TemporaryFile file;
   if (!file.Create(".JPG")) return Status::ErrorCreatingFile;
-  RETURN_IF_BAD(WritePicture(picture, file.Path(), {}));
+  RETURN_IF_BAD(WritePicture(picture, file.Path(), {.encode = options}));
   platform::FileView view;
   if (!view.Open(file.Path())) return Status::FileOpenError;
   bytes.assign(view.Bytes().begin(), view.Bytes().end());

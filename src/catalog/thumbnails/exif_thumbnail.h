@@ -5,6 +5,7 @@
 #include <vector>
 
 #include "core/status.h"
+#include "picture/encode_options.h"
 #include "picture/picture_record.h"
 
 namespace fotomill {
@@ -14,6 +15,6 @@ namespace fotomill {
 // else the status of the JPEG codec.
 Status DecodeExifThumbnail(std::span<const uint8_t> bytes, PicturePointer& picture);
 // The way back; `bytes` is empty unless Ok.
-Status EncodeExifThumbnail(PictureRecord& picture, std::vector<uint8_t>& bytes);
+Status EncodeExifThumbnail(PictureRecord& picture, const EncodeOptions& options, std::vector<uint8_t>& bytes);
 
 }  // namespace fotomill

@@ -62,9 +62,9 @@ PicturePointer ReadCached(const std::string& picturePath, const CacheFolder& fol
   platform::FileView file;
   if (path.empty() || !file.Open(path) || !IsOf(file.Bytes(), uri, facts.modified)) return nullptr;
   PicturePointer picture = NewPictureRecord();
-  if (picture == nullptr || DescribePng(file.Bytes(), *picture) != Status::Ok) return nullptr;
+  if (picture == nullptr || DescribePng(file.Bytes(), {}, *picture) != Status::Ok) return nullptr;
   if (std::max(picture->width, picture->height) > folder.side) return nullptr;
-  return DecodePng(file.Bytes(), *picture) == Status::Ok ? std::move(picture) : nullptr;
+  return DecodePng(file.Bytes(), {}, *picture) == Status::Ok ? std::move(picture) : nullptr;
 }
 
 }  // namespace

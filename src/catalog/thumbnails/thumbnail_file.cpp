@@ -71,10 +71,9 @@ bool WriteThumbnailForPicture(const std::string& picturePath, const PictureRecor
 
 Status MakeThumbnailOfFile(const std::string& picturePath, const ThumbnailOptions& options, ThumbnailRecord& record) {
   PicturePointer picture;
-  RETURN_IF_BAD(LoadPictureInfo(picturePath.c_str(), picture));
   // The quick scaler's result depends on the size that it starts from.
-  if (!options.quick) picture->thumbnailSide = kSmallThumbnailSide;
-  RETURN_IF_BAD(ReadPicture(*picture));
+  const int32_t side = options.quick ? 0 : kSmallThumbnailSide;
+  RETURN_IF_BAD(LoadPicture({.fileName = picturePath, .thumbnailSide = side, .options = options.read}, picture));
   if (picture->image.Empty()) return Status::EmptyImage;
   return MakeThumbnailRecord(record, *picture, options) ? Status::Ok : Status::MemoryAllocationError;
 }

@@ -4,6 +4,7 @@
 
 #include "core/choice_lists.h"
 #include "picture/picture_record.h"
+#include "picture/read_request.h"
 
 namespace fotomill {
 
@@ -17,6 +18,7 @@ struct ThumbnailOptions {
   bool keep = true;         // what was made for a browser goes into its database
   bool fastZoom = false;    // small records are enlarged by spreading their pixels
   int32_t zoomFilter = choice::kBicubic;  // else by this choice::ResampleFilter
+  ReadOptions read = {};                  // how the pictures are decoded
 
   bool operator==(const ThumbnailOptions&) const = default;
 };

@@ -146,7 +146,7 @@ int RunConvert(const ConvertOptions& options, const CommandContext& context) {
   const auto files = SelectFiles(options.selection, context);
   if (!files) return kExitUsage;
   if (!options.out.empty() && files->size() != 1) return UsageError(context, "--out takes exactly one picture.");
-  if (options.quality > 0) settings.JpegCompression = settings.WebPQualityFactor = options.quality;
+  if (options.quality > 0) job.encode.jpegQuality = job.encode.webpQuality = options.quality;
 
   ResultOutput output(context, options.json);
   TerminalPrompts prompts(context, output);

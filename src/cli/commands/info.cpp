@@ -11,6 +11,7 @@
 #include "core/shown_text.h"
 #include "core/text.h"
 #include "registry/registry.h"
+#include "settings/job_options.h"
 
 namespace fotomill::cli {
 
@@ -30,7 +31,7 @@ std::string Resolution(double pixelsPerInch) {
 // How long each frame is to be shown, and how often all of them are, 0 for ever.
 void AddFrames(const PictureRecord& picture, Json& facts) {
   AnimationPointer animation;
-  if (picture.pageCount < 2 || OpenAnimation(picture.fileName.c_str(), animation) != Status::Ok) return;
+  if (picture.pageCount < 2 || OpenAnimation({.fileName = picture.fileName.c_str()}, animation) != Status::Ok) return;
   facts["delaysMs"] = animation->Delays();
   facts["rounds"] = animation->Rounds();
 }
@@ -87,7 +88,7 @@ std::string FactsAsText(const PictureRecord& picture) {
 
 Status GatherFacts(const SelectedFile& file, PicturePointer& picture) {
   if (file.status != Status::Ok) return file.status;
-  RETURN_IF_BAD(LoadPictureInfo(file.name.c_str(), picture));
+  RETURN_IF_BAD(LoadPictureInfo({.fileName = file.name, .options = ReadOptionsFromSettings()}, picture));
   const FormatEntry& row = FormatRow(picture->formatIndex);
   if (row.details != nullptr) RETURN_IF_BAD(row.details(*picture));
   return Status::Ok;

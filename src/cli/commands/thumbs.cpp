@@ -145,7 +145,7 @@ int RunMake(const ThumbsOptions& options, const CommandContext& context) {
 
 // Writes what a command drew; a file of that name stays unless it may be replaced.
 int WriteDrawing(PictureRecord& picture, const std::string& name, const ThumbsOptions& options, ResultOutput& output) {
-  WriteOptions write;
+  WriteOptions write{.encode = EncodeOptionsFromSettings()};
   write.existing = options.overwrite == "replace" ? platform::Existing::Replace : platform::Existing::Refuse;
   const Status status = WritePicture(picture, options.out, write);
   if (status != Status::Ok) {
@@ -168,7 +168,7 @@ int RunShow(const ThumbsOptions& options, const CommandContext& context) {
   if (!platform::IsRegularFile(name)) return fail(name, Status::FileOpenError, {});
   ThumbnailRecord record;
   if (!ReadThumbnailFile(record, name)) return fail(name, Status::DamagedFile, "It is no thumbnail file.");
-  const PicturePointer picture = NewPictureRecord();
+  const PicturePointer picture = NewPictureRecord(ReadOptionsFromSettings().alphaBackground);
   if (picture == nullptr) return fail(name, Status::MemoryAllocationError, {});
   if (const Status status = ThumbnailRecordToBitmap(record, picture->image); status != Status::Ok) return fail(name, status, {});
   picture->width = picture->image.Width();
@@ -179,9 +179,7 @@ int RunShow(const ThumbsOptions& options, const CommandContext& context) {
 
 // A picture upright and in a square; smaller ones keep their size.
 Status DrawPicture(const std::string& name, int32_t side, PicturePointer& picture) {
-  RETURN_IF_BAD(LoadPictureInfo(name.c_str(), picture));
-  picture->thumbnailSide = side;
-  RETURN_IF_BAD(ReadPicture(*picture));
+  RETURN_IF_BAD(LoadPicture({.fileName = name, .thumbnailSide = side, .options = ReadOptionsFromSettings()}, picture));
   RETURN_IF_BAD(TurnUpright(*picture));
   picture->metadata = {};
   const int32_t width = picture->image.Width(), height = picture->image.Height();

@@ -9,6 +9,7 @@
 #include "cli/frame/result_output.h"
 #include "cli/frame/used_files.h"
 #include "registry/registry.h"
+#include "settings/job_options.h"
 
 namespace fotomill::cli {
 
@@ -22,7 +23,7 @@ struct VerifyOptions {
 // Decodes every frame of an animation.
 Status VerifyFrames(const std::string& name) {
   AnimationPointer animation;
-  Status status = OpenAnimation(name.c_str(), animation);
+  Status status = OpenAnimation({.fileName = name, .options = ReadOptionsFromSettings()}, animation);
   while (status == Status::Ok) status = animation->Next();
   return status == Status::NoImages ? Status::Ok : status;
 }
@@ -32,10 +33,11 @@ Status VerifyFile(const std::string& name, std::string& hint) {
   int32_t pages = 1;
   for (int32_t page = 0; page < pages; ++page) {
     PicturePointer picture;
-    RETURN_IF_BAD(LoadPictureInfo(name.c_str(), picture));
-    picture->page = page;
+    ReadRequest request{.fileName = name, .options = ReadOptionsFromSettings()};
+    RETURN_IF_BAD(LoadPictureInfo(request, picture));
+    request.page = page;
     pages = picture->pageCount;
-    RETURN_IF_BAD(ReadPicture(*picture));
+    RETURN_IF_BAD(ReadPicture(request, *picture));
     if (!picture->warning.empty()) {  // it can be shown, but it is not what was saved
       hint = picture->warning.view();
       return Status::DamagedFile;

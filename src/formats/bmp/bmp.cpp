@@ -46,7 +46,6 @@
 #include "core/text.h"
 #include "platform/file_view.h"
 #include "processing/pixel_rows.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -337,9 +336,9 @@ struct BmpLayout {
 };
 
 // UnsuitableImage when a size does not fit its field.
-Status ChooseLayout(const PictureRecord& picture, BmpLayout& layout) {
+Status ChooseLayout(const PictureRecord& picture, bool os2, BmpLayout& layout) {
   const PackedImage& image = picture.image;
-  layout.os2 = settings.WriteOS2Bitmaps != 0;
+  layout.os2 = os2;
   layout.alpha =
       !layout.os2 && image.Bits() == 24 && picture.alpha.Width() == image.Width() && picture.alpha.Height() == image.Height();
   layout.width = image.Width();
@@ -424,22 +423,22 @@ std::string Number(int64_t number) {
 
 }  // namespace
 
-Status BmpInfo(PictureRecord& picture, const char* fileName, uint32_t) {
+Status BmpInfo(PictureRecord& picture, const ReadRequest& request) {
   picture.typeName.Clear();
   platform::FileView file;
-  if (!file.OpenHead(fileName, kHeaderSize + 1024)) return Status::FileOpenError;
+  if (!file.OpenHead(request.fileName.c_str(), kHeaderSize + 1024)) return Status::FileOpenError;
   picture.fileSize = file.FileSize();
   BmpHeader header;
   RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
   return DescribePicture(file, header, picture);
 }
 
-Status BmpRead(PictureRecord& picture, const char* fileName) {
+Status BmpRead(PictureRecord& picture, const ReadRequest& request) {
   const ProgressScope progress(picture);
   picture.image.Free();
   picture.alpha.Free();
   platform::FileView file;
-  if (!file.Open(fileName)) return Status::FileOpenError;
+  if (!file.Open(request.fileName)) return Status::FileOpenError;
   if (file.FileSize() < kHeaderSize) return Status::FileReadError;
   BmpHeader header;
   RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
@@ -452,7 +451,7 @@ Status BmpRead(PictureRecord& picture, const char* fileName) {
   PackedImage image, alpha;
   RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette, picture.bitsPerPixel, image,
                                runLength ? platform::Fill::Zero : platform::Fill::Unset));
-  if (header.bits > 24 && settings.UseAlphaChannels != 0) {
+  if (header.bits > 24 && request.options.alphaChannels) {
     RETURN_IF_BAD(NewAlphaPlane(picture.width, picture.height, alpha));
   }
 
@@ -476,7 +475,7 @@ Status BmpWrite(PictureRecord& picture, const WriteOptions& options) {
   const ProgressScope progress(picture);
   if (picture.image.Empty()) return Status::MemoryAllocationError;
   BmpLayout layout;
-  RETURN_IF_BAD(ChooseLayout(picture, layout));
+  RETURN_IF_BAD(ChooseLayout(picture, options.encode.bmpOs2, layout));
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
   WriteHeader(out, layout);

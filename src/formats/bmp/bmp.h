@@ -1,6 +1,7 @@
 #pragma once
 
 #include "picture/picture_record.h"
+#include "picture/read_request.h"
 #include "picture/write_options.h"
 
 namespace fotomill {
@@ -10,11 +11,11 @@ namespace fotomill {
 
 // Fills the facts of `picture`: size, depth, palette, type name, kHasAlpha for files deeper than 24 bits. Ok,
 // FileOpenError; DamagedFile for a short header, another signature, or a size or depth that leaves nothing to decode.
-Status BmpInfo(PictureRecord& picture, const char* fileName, uint32_t flags);
+Status BmpInfo(PictureRecord& picture, const ReadRequest& request);
 
 // Fills the facts and decodes the pixels into `image`, and with `UseAlphaChannels` the fourth channel into `alpha`. Ok,
 // FileOpenError, DamagedFile as BmpInfo; FileReadError when the file ends too early; MemoryAllocationError.
-Status BmpRead(PictureRecord& picture, const char* fileName);
+Status BmpRead(PictureRecord& picture, const ReadRequest& request);
 
 // Writes `image`, and `alpha` as the fourth channel, to picture.fileName, uncompressed, in the dialect that
 // `WriteOS2Bitmaps` says. Ok; MemoryAllocationError when there is no image; UnsuitableImage when a size does not fit

@@ -224,21 +224,21 @@ Status CheckRowsFit(const platform::FileView& file, const FitsHeader& header) {
 
 }  // namespace
 
-Status FitsInfo(PictureRecord& picture, const char* fileName, uint32_t) {
+Status FitsInfo(PictureRecord& picture, const ReadRequest& request) {
   platform::FileView file;
-  if (!file.OpenHead(fileName, limits.fitsCards * kCardBytes)) return Status::FileOpenError;
+  if (!file.OpenHead(request.fileName.c_str(), limits.fitsCards * kCardBytes)) return Status::FileOpenError;
   if (file.Bytes().size() < kSignature.size()) return Status::FileReadError;
   if (!ByteReader(file.Bytes()).Match(kSignature)) return Status::DamagedFile;
   FitsHeader header;
   return DescribePicture(file, picture, header);
 }
 
-Status FitsRead(PictureRecord& picture, const char* fileName) {
+Status FitsRead(PictureRecord& picture, const ReadRequest& request) {
   const ProgressScope progress(picture);
   picture.image.Free();
   picture.alpha.Free();
   platform::FileView file;
-  if (!file.Open(fileName)) return Status::FileOpenError;
+  if (!file.Open(request.fileName)) return Status::FileOpenError;
   FitsHeader header;
   RETURN_IF_BAD(DescribePicture(file, picture, header));
   RETURN_IF_BAD(CheckRowsFit(file, header));

@@ -1,12 +1,13 @@
 #pragma once
 
 #include "picture/picture_record.h"
+#include "picture/read_request.h"
 #include "picture/write_options.h"
 
 namespace fotomill {
 
-Status FitsInfo(PictureRecord& picture, const char* fileName, uint32_t flags);
-Status FitsRead(PictureRecord& picture, const char* fileName);
+Status FitsInfo(PictureRecord& picture, const ReadRequest& request);
+Status FitsRead(PictureRecord& picture, const ReadRequest& request);
 Status FitsWrite(PictureRecord& picture, const WriteOptions& options);
 Status FitsDetails(PictureRecord& picture);
 

@@ -39,7 +39,6 @@
 #include "formats/gif/gif_frames.h"
 #include "formats/gif/gif_lzw.h"
 #include "platform/file_view.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -52,12 +51,12 @@ bool KeepsPalette(const GifScreen& screen, const GifFrame& frame, int32_t page) 
   return page == 0 && frame.transparent == kNoIndex && frame.Covers(screen);
 }
 
-// Facts of the frame that `picture.page` selects, as far as its head tells. The reader stays behind that of the first one.
-Status DescribePicture(ByteReader& bytes, GifScreen& screen, GifFrame& frame, PictureRecord& picture) {
+// Facts of frame `page`, as far as its head tells. The reader stays behind that of the first one.
+Status DescribePicture(ByteReader& bytes, int32_t page, GifScreen& screen, GifFrame& frame, PictureRecord& picture) {
   RETURN_IF_BAD(ParseScreen(bytes, screen));
   RETURN_IF_BAD(NextFrame(bytes, screen, frame));
   if (screen.width < 1 || screen.height < 1 || frame.width < 1 || frame.height < 1) return Status::DamagedFile;
-  const bool keepsPalette = KeepsPalette(screen, frame, picture.page);
+  const bool keepsPalette = KeepsPalette(screen, frame, page);
   picture.typeName.AssignCut(screen.is89 ? "GIF 89a" : "GIF 87a");
   picture.width = screen.width;
   picture.height = screen.height;
@@ -105,20 +104,21 @@ Status ReadIndexed(ByteReader& bytes, const GifFrame& frame, PictureRecord& pict
   return Status::Ok;
 }
 
-// Draws the frames up to `picture.page`. NoImages when there are fewer.
-Status ReadComposed(ByteReader& bytes, GifScreen& screen, GifFrame frame, const PictureRecord& picture, Canvas& canvas) {
+// Draws the frames up to `last`. NoImages when there are fewer.
+Status ReadComposed(ByteReader& bytes, GifScreen& screen, GifFrame frame, int32_t last, Canvas& canvas) {
   GifDrawing drawing;
   RETURN_IF_BAD(drawing.Begin(screen, canvas));
   for (int32_t page = 0;; ++page) {
     RETURN_IF_BAD(drawing.Draw(bytes, frame, canvas));
-    if (page == picture.page) return Status::Ok;
+    if (page == last) return Status::Ok;
     RETURN_IF_BAD(NextFrame(bytes, screen, frame));
   }
 }
 
-void WriteHeader(ByteWriter& out, const PictureRecord& picture, int32_t bits) {
+void WriteHeader(ByteWriter& out, const PictureRecord& picture, bool version89) {
+  const int32_t bits = picture.image.Bits();
   const auto flags = static_cast<uint8_t>(0x80 | (bits - 1) << 4 | (bits - 1));
-  out.Text(settings.CreateGif89 != 0 ? "GIF89a" : "GIF87a");
+  out.Text(version89 ? "GIF89a" : "GIF87a");
   out.Le16(static_cast<uint16_t>(picture.image.Width()));
   out.Le16(static_cast<uint16_t>(picture.image.Height()));
   out.U8(flags);
@@ -147,9 +147,8 @@ void UnpackRow(std::span<const uint8_t> row, int32_t bits, std::span<uint8_t> in
   }
 }
 
-void WritePixels(ByteWriter& out, const PictureRecord& picture) {
+void WritePixels(ByteWriter& out, const PictureRecord& picture, bool interlaced) {
   const PackedImage& image = picture.image;
-  const bool interlaced = settings.WriteGIFInterlaced != 0;
   out.U8(kPictureBlock);
   out.Zeros(4);
   out.Le16(static_cast<uint16_t>(image.Width()));
@@ -172,34 +171,34 @@ void WritePixels(ByteWriter& out, const PictureRecord& picture) {
 
 }  // namespace
 
-Status GifInfo(PictureRecord& picture, const char* fileName, uint32_t) {
+Status GifInfo(PictureRecord& picture, const ReadRequest& request) {
   picture.typeName.Clear();
   platform::FileView file;
-  if (!file.Open(fileName)) return Status::FileOpenError;
+  if (!file.Open(request.fileName)) return Status::FileOpenError;
   picture.fileSize = file.FileSize();
   ByteReader bytes(file.Bytes());
   GifScreen screen;
   GifFrame frame;
-  RETURN_IF_BAD(DescribePicture(bytes, screen, frame, picture));
+  RETURN_IF_BAD(DescribePicture(bytes, request.page, screen, frame, picture));
   picture.pageCount = CountGifFrames(bytes, screen);
   return Status::Ok;
 }
 
-Status GifRead(PictureRecord& picture, const char* fileName) {
+Status GifRead(PictureRecord& picture, const ReadRequest& request) {
   const ProgressScope progress(picture);
   picture.image.Free();
   picture.alpha.Free();
   platform::FileView file;
-  if (!file.Open(fileName)) return Status::FileOpenError;
+  if (!file.Open(request.fileName)) return Status::FileOpenError;
   ByteReader bytes(file.Bytes());
   GifScreen screen;
   GifFrame frame;
-  RETURN_IF_BAD(DescribePicture(bytes, screen, frame, picture));
+  RETURN_IF_BAD(DescribePicture(bytes, request.page, screen, frame, picture));
   Canvas made;
   if (picture.bitsPerPixel <= 8) {
     RETURN_IF_BAD(ReadIndexed(bytes, frame, picture, made.image));
   } else {
-    RETURN_IF_BAD(ReadComposed(bytes, screen, frame, picture, made));
+    RETURN_IF_BAD(ReadComposed(bytes, screen, frame, request.page, made));
   }
   if (!file.Intact()) return Status::FileReadError;
   picture.image = std::move(made.image);
@@ -215,9 +214,9 @@ Status GifWrite(PictureRecord& picture, const WriteOptions& options) {
   if (image.Width() > UINT16_MAX || image.Height() > UINT16_MAX) return Status::UnsuitableImage;
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
-  WriteHeader(out, picture, image.Bits());
-  if (settings.CreateGif89 != 0) WriteComment(out, picture.comment);
-  WritePixels(out, picture);
+  WriteHeader(out, picture, options.encode.gif89);
+  if (options.encode.gif89) WriteComment(out, picture.comment);
+  WritePixels(out, picture, options.encode.gifInterlaced);
   out.U8(kEndBlock);
   return CommitOutput(out, options);
 }

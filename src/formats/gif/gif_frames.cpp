@@ -46,7 +46,7 @@ uint8_t* AlphaAt(Canvas& canvas, int32_t x, int32_t y) { return canvas.alpha.Row
 
 class GifAnimation final : public Animation {
  public:
-  Status Open(const char* fileName) {
+  Status Open(const std::string& fileName) {
     if (!file_.Open(fileName)) return Status::FileOpenError;
     ByteReader bytes(file_.Bytes());
     RETURN_IF_BAD(ParseScreen(bytes, screen_));
@@ -147,9 +147,9 @@ int32_t CountGifFrames(ByteReader bytes, GifScreen screen) {
   return static_cast<int32_t>(count);
 }
 
-Status GifAnimate(const char* fileName, AnimationPointer& animation) {
+Status GifAnimate(const ReadRequest& request, AnimationPointer& animation) {
   auto opened = std::make_unique<GifAnimation>();
-  RETURN_IF_BAD(opened->Open(fileName));
+  RETURN_IF_BAD(opened->Open(request.fileName));
   animation = std::move(opened);
   return Status::Ok;
 }

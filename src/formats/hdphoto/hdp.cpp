@@ -240,8 +240,8 @@ void TakeMetadata(std::span<const uint8_t> file, const HdpPage& page, PictureRec
   }
 }
 
-Status Describe(std::span<const uint8_t> file, HdpPage& page, PictureRecord& picture) {
-  RETURN_IF_BAD(ParseHdpPage(file, picture.page, page));
+Status Describe(std::span<const uint8_t> file, int32_t index, HdpPage& page, PictureRecord& picture) {
+  RETURN_IF_BAD(ParseHdpPage(file, index, page));
   picture.pageCount = std::max(1, CountHdpPages(file));
   picture.typeName.AssignCut("HD Photo");
   picture.width = page.image.width;
@@ -295,23 +295,23 @@ void AddDetails(const HdpPage& page, const PictureRecord& picture, DetailLines& 
 
 bool HdpWorksHere() { return HasHdpLibrary(); }
 
-Status HdpInfo(PictureRecord& picture, const char* fileName, uint32_t) {
+Status HdpInfo(PictureRecord& picture, const ReadRequest& request) {
   picture.typeName.Clear();
   platform::FileView file;
-  if (!file.Open(fileName)) return Status::FileOpenError;
+  if (!file.Open(request.fileName)) return Status::FileOpenError;
   picture.fileSize = file.FileSize();
   HdpPage page;
-  return Describe(file.Bytes(), page, picture);
+  return Describe(file.Bytes(), request.page, page, picture);
 }
 
-Status HdpRead(PictureRecord& picture, const char* fileName) {
+Status HdpRead(PictureRecord& picture, const ReadRequest& request) {
   const ProgressScope progress(picture);
   picture.image.Free();
   picture.alpha.Free();
   platform::FileView file;
-  if (!file.Open(fileName)) return Status::FileOpenError;
+  if (!file.Open(request.fileName)) return Status::FileOpenError;
   HdpPage page;
-  RETURN_IF_BAD(Describe(file.Bytes(), page, picture));
+  RETURN_IF_BAD(Describe(file.Bytes(), request.page, page, picture));
   RETURN_IF_BAD(CheckPackedSize(picture.width, picture.height, picture.bitsPerPixel));
   HdpRaster raster;
   RETURN_IF_BAD(DecodeHdp(page, raster, [&](int32_t rows) { picture.ReportRow(rows); }));
@@ -334,7 +334,7 @@ Status HdpDetails(PictureRecord& picture) {
   platform::FileView file;
   if (!file.Open(picture.fileName.c_str())) return Status::FileOpenError;
   HdpPage page;
-  RETURN_IF_BAD(Describe(file.Bytes(), page, picture));
+  RETURN_IF_BAD(Describe(file.Bytes(), 0, page, picture));
   AddDetails(page, picture, picture.detailLines);
   return Status::Ok;
 }

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "picture/picture_record.h"
+#include "picture/read_request.h"
 #include "picture/write_options.h"
 
 namespace fotomill {
@@ -8,8 +9,8 @@ namespace fotomill {
 // HD Photo. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3), MemoryAllocationError (6),
 // UnsupportedFormat (8) for colors that are no picture's, NoImages (20) for a page that is not there. Reading and
 // writing also FeatureDisabled (22) where the library is missing.
-Status HdpInfo(PictureRecord& picture, const char* fileName, uint32_t flags);
-Status HdpRead(PictureRecord& picture, const char* fileName);
+Status HdpInfo(PictureRecord& picture, const ReadRequest& request);
+Status HdpRead(PictureRecord& picture, const ReadRequest& request);
 Status HdpDetails(PictureRecord& picture);
 // Also ErrorCreatingFile (10), ErrorWritingFile (11).
 Status HdpWrite(PictureRecord& picture, const WriteOptions& options);

@@ -10,7 +10,6 @@
 #include "formats/hdphoto/hdp_codec.h"
 #include "formats/hdphoto/hdp_file.h"
 #include "processing/promote.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -111,10 +110,10 @@ struct HdpMetadata {
   std::vector<uint8_t> comment;  // with a zero behind it
 };
 
-Directory MakeDirectory(const PictureRecord& picture, bool keep, const HdpMetadata& extra) {
+Directory MakeDirectory(const PictureRecord& picture, const WriteOptions& options, const HdpMetadata& extra) {
   const PictureMetadata& metadata = picture.metadata;
-  const auto dpi = [](double value) {
-    return std::bit_cast<uint32_t>(static_cast<float>(value > 0 ? value : settings.TiffResolution));
+  const auto dpi = [&](double value) {
+    return std::bit_cast<uint32_t>(static_cast<float>(value > 0 ? value : options.encode.resolution));
   };
   Directory directory;
   directory.Value(kHdpWidth, kHdpLong, static_cast<uint32_t>(picture.image.Width()));
@@ -123,7 +122,7 @@ Directory MakeDirectory(const PictureRecord& picture, bool keep, const HdpMetada
   directory.Value(kHdpDpiY, kHdpFloat, dpi(metadata.dpiY));
   directory.Value(kHdpImageOffset, kHdpLong, 0);
   directory.Value(kHdpImageSize, kHdpLong, 0);
-  if (!keep) return directory;
+  if (!options.KeepsMetadata()) return directory;
   bool described = false;
   for (const ExifEntry& entry : extra.exif.first) {
     if (entry.type == kHdpText) directory.Block(entry.tag, kHdpText, entry.value);
@@ -140,7 +139,8 @@ Directory MakeDirectory(const PictureRecord& picture, bool keep, const HdpMetada
   return directory;
 }
 
-Status WriteAll(ByteWriter& out, PictureRecord& picture, bool keep) {
+Status WriteAll(ByteWriter& out, PictureRecord& picture, const WriteOptions& options) {
+  const bool keep = options.KeepsMetadata();
   const bool gray = IsGray(picture);
   PackedImage source;
   RETURN_IF_BAD(MakeSource(picture, gray, source));
@@ -157,7 +157,7 @@ Status WriteAll(ByteWriter& out, PictureRecord& picture, bool keep) {
   }
   extra.placed = PlaceExif(extra.exif, kExifPlace);
   const auto directoryAt = static_cast<uint32_t>(kExifPlace + extra.placed.bytes.size());
-  Directory directory = MakeDirectory(picture, keep, extra);
+  Directory directory = MakeDirectory(picture, options, extra);
   out.Text("II\xBC\x01");
   out.Le32(directoryAt);
   out.Bytes(kPixelFormat);
@@ -166,8 +166,8 @@ Status WriteAll(ByteWriter& out, PictureRecord& picture, bool keep) {
   directory.Pointer(kHdpPixelFormat, kHdpByte, 16, kPixelFormatPlace);
   directory.Write(out);
   const uint64_t start = out.Position();
-  const HdpEncoding encoding = {std::clamp<int32_t>(settings.HDPCompression, 0, 255),
-                                (settings.HDPWriteOptions & kInFrequencyOrder) != 0};
+  const HdpEncoding encoding = {std::clamp<int32_t>(options.encode.hdpCompression, 0, 255),
+                                (options.encode.hdpBits & kInFrequencyOrder) != 0};
   RETURN_IF_BAD(EncodeHdp(source, encoding, out, [&](int32_t row) { picture.ReportRow(row); }));
   if (out.Position() > UINT32_MAX) return Status::UnsuitableImage;
   out.PatchLe32(directory.PlaceOf(kHdpImageOffset), static_cast<uint32_t>(start));
@@ -183,7 +183,7 @@ Status HdpWrite(PictureRecord& picture, const WriteOptions& options) {
   if (!HdpWorksHere()) return Status::FeatureDisabled;
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
-  RETURN_IF_BAD(WriteAll(out, picture, options.keepMetadata && settings.PreserveEXIF != 0));
+  RETURN_IF_BAD(WriteAll(out, picture, options));
   return CommitOutput(out, options);
 }
 

@@ -37,7 +37,6 @@
 #include "formats/png/png.h"
 #include "platform/file_view.h"
 #include "platform/paths.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -226,10 +225,11 @@ Status ReadBitmap(const IcoBitmap& bitmap, PictureRecord& picture, PackedImage& 
 }
 
 // A PNG entry is a whole file of its own; the names and pages of the icon stay.
-Status LoadPngEntry(std::span<const uint8_t> entry, PictureRecord& picture, PackedImage* image, PackedImage* alpha) {
+Status LoadPngEntry(std::span<const uint8_t> entry, const ReadOptions& options, PictureRecord& picture, PackedImage* image,
+                    PackedImage* alpha) {
   const FixedText<64> typeName = picture.typeName;
   const int32_t pages = picture.pageCount;
-  const Status status = image == nullptr ? DescribePng(entry, picture) : DecodePng(entry, picture);
+  const Status status = image == nullptr ? DescribePng(entry, options, picture) : DecodePng(entry, options, picture);
   picture.typeName = typeName;
   picture.pageCount = pages;
   RETURN_IF_BAD(status);
@@ -240,15 +240,15 @@ Status LoadPngEntry(std::span<const uint8_t> entry, PictureRecord& picture, Pack
   return Status::Ok;
 }
 
-// Facts, and with `image` the pixels, of the entry that the picture's page selects.
-Status LoadEntry(IcoFile& icons, PictureRecord& picture, PackedImage* image, PackedImage* alpha) {
-  const IcoEntry* entry = ChooseEntry(icons, picture.page);
+// Facts, and with `image` the pixels, of the entry that the request's page selects.
+Status LoadEntry(IcoFile& icons, const ReadRequest& request, PictureRecord& picture, PackedImage* image, PackedImage* alpha) {
+  const IcoEntry* entry = ChooseEntry(icons, request.page);
   if (entry == nullptr) return Status::NoImages;
   picture.typeName.AssignCut(icons.cursors ? "Windows cursor" : "Windows icon");
   picture.pageCount = static_cast<int32_t>(icons.entries.size());
   picture.hotSpotX = icons.cursors ? entry->hotSpotX : 0;
   picture.hotSpotY = icons.cursors ? entry->hotSpotY : 0;
-  if (IsPng(entry->bytes)) return LoadPngEntry(entry->bytes, picture, image, alpha);
+  if (IsPng(entry->bytes)) return LoadPngEntry(entry->bytes, request.options, picture, image, alpha);
   IcoBitmap bitmap;
   RETURN_IF_BAD(ParseBitmap(entry->bytes, bitmap));
   DescribeBitmap(bitmap, picture);
@@ -267,7 +267,7 @@ struct IcoLayout {
   uint32_t PictureSize() const { return kInfoSize + 4 * colors + colorBytes + maskBytes; }
 };
 
-IcoLayout ChooseLayout(const PictureRecord& picture) {
+IcoLayout ChooseLayout(const PictureRecord& picture, int32_t compression) {
   const PackedImage& image = picture.image;
   IcoLayout layout;
   layout.bits = image.Bits() == 24 && !picture.alpha.Empty() ? 32 : image.Bits();
@@ -276,7 +276,7 @@ IcoLayout ChooseLayout(const PictureRecord& picture) {
   layout.maskBytes = static_cast<uint32_t>(RowStride(image.Width(), 1)) * static_cast<uint32_t>(image.Height());
   layout.cursor = EqualIgnoringCase(platform::ExtensionOf(picture.fileName), "cur");
   const bool fullSize = image.Width() == kMostSide && image.Height() == kMostSide;
-  layout.png = settings.ICOCompression == choice::kIconPngAlways || (settings.ICOCompression == choice::kIconPng256 && fullSize);
+  layout.png = compression == choice::kIconPngAlways || (compression == choice::kIconPng256 && fullSize);
   return layout;
 }
 
@@ -343,26 +343,26 @@ void WriteMask(ByteWriter& out, const PictureRecord& picture) {
 
 }  // namespace
 
-Status IcoInfo(PictureRecord& picture, const char* fileName, uint32_t) {
+Status IcoInfo(PictureRecord& picture, const ReadRequest& request) {
   picture.typeName.Clear();
   platform::FileView file;
-  if (!file.Open(fileName)) return Status::FileOpenError;
+  if (!file.Open(request.fileName)) return Status::FileOpenError;
   picture.fileSize = file.FileSize();
   IcoFile icons;
   RETURN_IF_BAD(ParseDirectory(file.Bytes(), icons));
-  return LoadEntry(icons, picture, nullptr, nullptr);
+  return LoadEntry(icons, request, picture, nullptr, nullptr);
 }
 
-Status IcoRead(PictureRecord& picture, const char* fileName) {
+Status IcoRead(PictureRecord& picture, const ReadRequest& request) {
   const ProgressScope progress(picture);
   picture.image.Free();
   picture.alpha.Free();
   platform::FileView file;
-  if (!file.Open(fileName)) return Status::FileOpenError;
+  if (!file.Open(request.fileName)) return Status::FileOpenError;
   IcoFile icons;
   RETURN_IF_BAD(ParseDirectory(file.Bytes(), icons));
   PackedImage image, alpha;
-  RETURN_IF_BAD(LoadEntry(icons, picture, &image, &alpha));
+  RETURN_IF_BAD(LoadEntry(icons, request, picture, &image, &alpha));
   if (!file.Intact()) return Status::FileReadError;
   picture.image = std::move(image);
   picture.alpha = std::move(alpha);
@@ -375,10 +375,10 @@ Status IcoWrite(PictureRecord& picture, const WriteOptions& options) {
   if (picture.image.Width() > kMostSide || picture.image.Height() > kMostSide) return Status::UnsuitableImage;
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
-  const IcoLayout layout = ChooseLayout(picture);
+  const IcoLayout layout = ChooseLayout(picture, options.encode.iconCompression);
   WriteDirectory(out, picture, layout);
   if (layout.png) {
-    RETURN_IF_BAD(EncodePng(picture, out));
+    RETURN_IF_BAD(EncodePng(picture, options.encode, out));
     out.PatchLe32(kSizeOffset, static_cast<uint32_t>(out.Position()) - kFileHeaderSize - kEntrySize);
   } else {
     WriteBitmapHeader(out, picture, layout);

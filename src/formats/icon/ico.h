@@ -1,14 +1,15 @@
 #pragma once
 
 #include "picture/picture_record.h"
+#include "picture/read_request.h"
 #include "picture/write_options.h"
 
 namespace fotomill {
 
-// Windows icons and cursors. `picture.page` counts the entries from the best one, 0, down. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when an entry is cut short,
+// Windows icons and cursors. `page` of the request counts the entries from the best one, 0, down. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when an entry is cut short,
 // MemoryAllocationError (6), UnsupportedFormat (8) for a compressed bitmap, NoImages (20) for an empty file.
-Status IcoInfo(PictureRecord& picture, const char* fileName, uint32_t flags);
-Status IcoRead(PictureRecord& picture, const char* fileName);
+Status IcoInfo(PictureRecord& picture, const ReadRequest& request);
+Status IcoRead(PictureRecord& picture, const ReadRequest& request);
 // Writes one entry; a cursor when the extension is "cur". Also UnsuitableImage (13) for sides over 256,
 // ErrorCreatingFile (10), ErrorWritingFile (11).
 Status IcoWrite(PictureRecord& picture, const WriteOptions& options);

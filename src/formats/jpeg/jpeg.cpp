@@ -30,7 +30,6 @@
 #include "core/limits.h"
 #include "formats/jpeg/jpeg_library.h"
 #include "platform/file_view.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -190,22 +189,20 @@ bool HasGrayPalette(const PictureRecord& picture) {
   return colors > 0;
 }
 
-void SetSampling(jpeg_compress_struct& info) {
+void SetSampling(jpeg_compress_struct& info, int32_t choice) {
   if (info.num_components != 3) return;
-  const int32_t choice = settings.JpegSubsample;
   info.comp_info[0].h_samp_factor = choice == choice::kSubsample444 ? 1 : 2;
   info.comp_info[0].v_samp_factor = choice == choice::kSubsample420 ? 2 : 1;
 }
 
-void SetResolution(jpeg_compress_struct& info, const PictureMetadata& metadata) {
-  if (settings.JpegStoreDPI == 0) return;
+void SetResolution(jpeg_compress_struct& info, const PictureMetadata& metadata, int32_t otherwise) {
   const auto clamp = [](double dpi) { return static_cast<UINT16>(std::clamp<long>(std::lround(dpi), 1, 65535)); };
   info.density_unit = 1;
-  info.X_density = clamp(metadata.dpiX > 0 ? metadata.dpiX : settings.TiffResolution);
-  info.Y_density = clamp(metadata.dpiY > 0 ? metadata.dpiY : settings.TiffResolution);
+  info.X_density = clamp(metadata.dpiX > 0 ? metadata.dpiX : otherwise);
+  info.Y_density = clamp(metadata.dpiY > 0 ? metadata.dpiY : otherwise);
 }
 
-void SetParameters(JpegWriter& writer, const PictureRecord& picture, bool gray, int32_t quality) {
+void SetParameters(JpegWriter& writer, const PictureRecord& picture, bool gray, const EncodeOptions& options) {
   jpeg_compress_struct& info = writer.info;
   jpeg_create_compress(&info);
   info.client_data = &writer.out;
@@ -218,10 +215,10 @@ void SetParameters(JpegWriter& writer, const PictureRecord& picture, bool gray, 
   info.input_components = gray ? 1 : 3;
   info.in_color_space = gray ? JCS_GRAYSCALE : JCS_EXT_BGR;
   jpeg_set_defaults(&info);
-  jpeg_set_quality(&info, std::clamp<int>(quality > 0 ? quality : settings.JpegCompression, 1, 100), TRUE);
-  SetSampling(info);
-  SetResolution(info, picture.metadata);
-  if (settings.WriteJpegProgressive != 0) {
+  jpeg_set_quality(&info, std::clamp<int>(options.jpegQuality, 1, 100), TRUE);
+  SetSampling(info, options.jpegSubsampling);
+  if (options.jpegStoresResolution) SetResolution(info, picture.metadata, options.resolution);
+  if (options.jpegProgressive) {
     jpeg_simple_progression(&info);
   } else {
     info.optimize_coding = FALSE;
@@ -278,14 +275,14 @@ void ExpandRow(const PictureRecord& picture, int32_t y, bool gray, std::vector<u
   }
 }
 
-Status WriteAll(JpegWriter& writer, PictureRecord& picture, bool keep, int32_t quality) {
+Status WriteAll(JpegWriter& writer, PictureRecord& picture, const WriteOptions& options) {
   const PackedImage& image = picture.image;
   const bool gray = HasGrayPalette(picture);
   std::vector<uint8_t> expanded(image.Bits() == 24 ? 0 : (gray ? 1 : 3) * static_cast<size_t>(image.Width()));
   const bool written = Guarded(writer.errors, [&] {
-    SetParameters(writer, picture, gray, quality);
+    SetParameters(writer, picture, gray, options.encode);
     jpeg_start_compress(&writer.info, TRUE);
-    if (keep) WriteMetadata(writer.info, picture);
+    if (options.KeepsMetadata()) WriteMetadata(writer.info, picture);
     for (int32_t y = 0; y < image.Height(); ++y) {
       if (!expanded.empty()) ExpandRow(picture, y, gray, expanded);
       JSAMPROW row = expanded.empty() ? const_cast<JSAMPROW>(image.Row(y).data()) : expanded.data();
@@ -329,27 +326,27 @@ void AddDetails(const jpeg_decompress_struct& info, const PictureRecord& picture
 
 }  // namespace
 
-Status JpegInfo(PictureRecord& picture, const char* fileName, uint32_t) {
+Status JpegInfo(PictureRecord& picture, const ReadRequest& request) {
   picture.typeName.Clear();
   platform::FileView file;
-  if (!file.Open(fileName)) return Status::FileOpenError;
+  if (!file.Open(request.fileName)) return Status::FileOpenError;
   picture.fileSize = file.FileSize();
   JpegReader reader;
   RETURN_IF_BAD(ReadHeader(reader, file.Bytes()));
   return DescribePicture(reader.info, picture);
 }
 
-Status JpegRead(PictureRecord& picture, const char* fileName) {
+Status JpegRead(PictureRecord& picture, const ReadRequest& request) {
   const ProgressScope progress(picture);
   picture.image.Free();
   picture.alpha.Free();
   picture.warning.Clear();
   platform::FileView file;
-  if (!file.Open(fileName)) return Status::FileOpenError;
+  if (!file.Open(request.fileName)) return Status::FileOpenError;
   JpegReader reader;
   RETURN_IF_BAD(ReadHeader(reader, file.Bytes()));
   RETURN_IF_BAD(DescribePicture(reader.info, picture));
-  if (!Guarded(reader.errors, [&] { SetOutput(reader.info, picture.thumbnailSide); })) return reader.Failure();
+  if (!Guarded(reader.errors, [&] { SetOutput(reader.info, request.thumbnailSide); })) return reader.Failure();
   PackedImage image;
   RETURN_IF_BAD(NewPackedImage(static_cast<int32_t>(reader.info.output_width), static_cast<int32_t>(reader.info.output_height),
                                &picture.palette, picture.bitsPerPixel, image));
@@ -367,7 +364,7 @@ Status JpegWrite(PictureRecord& picture, const WriteOptions& options) {
   if (picture.image.Width() > JPEG_MAX_DIMENSION || picture.image.Height() > JPEG_MAX_DIMENSION) return Status::UnsuitableImage;
   JpegWriter writer;
   if (!writer.out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
-  RETURN_IF_BAD(WriteAll(writer, picture, options.keepMetadata && settings.PreserveEXIF != 0, options.quality));
+  RETURN_IF_BAD(WriteAll(writer, picture, options));
   return CommitOutput(writer.out, options);
 }
 

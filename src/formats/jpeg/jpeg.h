@@ -1,15 +1,16 @@
 #pragma once
 
 #include "picture/picture_record.h"
+#include "picture/read_request.h"
 #include "picture/write_options.h"
 
 namespace fotomill {
 
 // JPEG. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when pixel data are cut short,
 // MemoryAllocationError (6), UnsupportedFormat (8) for the processes that are not decoded (arithmetic, lossless, 12 bits).
-// `picture.thumbnailSide` asks for a smaller decode.
-Status JpegInfo(PictureRecord& picture, const char* fileName, uint32_t flags);
-Status JpegRead(PictureRecord& picture, const char* fileName);
+// `thumbnailSide` of the request asks for a smaller decode.
+Status JpegInfo(PictureRecord& picture, const ReadRequest& request);
+Status JpegRead(PictureRecord& picture, const ReadRequest& request);
 // Also UnsuitableImage (13) for sides over 65535, ErrorCreatingFile (10), ErrorWritingFile (11).
 Status JpegWrite(PictureRecord& picture, const WriteOptions& options);
 Status JpegDetails(PictureRecord& picture);

@@ -39,7 +39,6 @@
 #include "platform/clock.h"
 #include "platform/file_view.h"
 #include "platform/paths.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -185,19 +184,19 @@ Status DescribePicture(const platform::FileView& file, PictureRecord& picture) {
 
 }  // namespace
 
-Status MacInfo(PictureRecord& picture, const char* fileName, uint32_t flags) {
-  if ((flags & kInfoSignedOnly) != 0) return Status::UnsupportedFormat;
+Status MacInfo(PictureRecord& picture, const ReadRequest& request) {
+  if (request.signedOnly) return Status::UnsupportedFormat;
   platform::FileView file;
-  if (!file.OpenHead(fileName, kMacBinarySize)) return Status::FileOpenError;
+  if (!file.OpenHead(request.fileName.c_str(), kMacBinarySize)) return Status::FileOpenError;
   return DescribePicture(file, picture);
 }
 
-Status MacRead(PictureRecord& picture, const char* fileName) {
+Status MacRead(PictureRecord& picture, const ReadRequest& request) {
   const ProgressScope progress(picture);
   picture.image.Free();
   picture.alpha.Free();
   platform::FileView file;
-  if (!file.Open(fileName)) return Status::FileOpenError;
+  if (!file.Open(request.fileName)) return Status::FileOpenError;
   RETURN_IF_BAD(DescribePicture(file, picture));
 
   PackedImage image;
@@ -219,7 +218,7 @@ Status MacWrite(PictureRecord& picture, const WriteOptions& options) {
   if (picture.image.Bits() != 1) return Status::TooManyColors;
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
-  const bool withMacBinary = settings.CreateMacbinaryHeader != 0;
+  const bool withMacBinary = options.encode.macBinary;
   if (withMacBinary) WriteMacBinaryHeader(out, picture.fileName);
   WriteMacPaintHeader(out);
   for (int32_t y = 0; y < kHeight && !out.Failed(); ++y) {

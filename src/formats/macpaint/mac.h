@@ -1,12 +1,13 @@
 #pragma once
 
 #include "picture/picture_record.h"
+#include "picture/read_request.h"
 #include "picture/write_options.h"
 
 namespace fotomill {
 
-Status MacInfo(PictureRecord& picture, const char* fileName, uint32_t flags);
-Status MacRead(PictureRecord& picture, const char* fileName);
+Status MacInfo(PictureRecord& picture, const ReadRequest& request);
+Status MacRead(PictureRecord& picture, const ReadRequest& request);
 Status MacWrite(PictureRecord& picture, const WriteOptions& options);
 
 }  // namespace fotomill

@@ -254,19 +254,19 @@ void WriteLines(ByteWriter& out, const PcxLayout& layout, const PictureRecord& p
 
 }  // namespace
 
-Status PcxInfo(PictureRecord& picture, const char* fileName, uint32_t) {
+Status PcxInfo(PictureRecord& picture, const ReadRequest& request) {
   platform::FileView file;
-  if (!file.OpenHead(fileName, kHeaderSize)) return Status::FileOpenError;
+  if (!file.OpenHead(request.fileName.c_str(), kHeaderSize)) return Status::FileOpenError;
   PcxHeader header;
   return DescribePicture(file, picture, header);
 }
 
-Status PcxRead(PictureRecord& picture, const char* fileName) {
+Status PcxRead(PictureRecord& picture, const ReadRequest& request) {
   const ProgressScope progress(picture);
   picture.image.Free();
   picture.alpha.Free();
   platform::FileView file;
-  if (!file.Open(fileName)) return Status::FileOpenError;
+  if (!file.Open(request.fileName)) return Status::FileOpenError;
   PcxHeader header;
   RETURN_IF_BAD(DescribePicture(file, picture, header));
 

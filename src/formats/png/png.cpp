@@ -27,7 +27,6 @@
 #include "formats/png/png_pixels.h"
 #include "platform/file_view.h"
 #include "processing/pixel_rows.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -201,11 +200,12 @@ int32_t FrameCount(std::span<const uint8_t> file) {
 }
 
 // Fills the facts.
-Status Describe(PngReader& reader, std::span<const uint8_t> file, PngLayout& layout, PictureRecord& picture) {
+Status Describe(PngReader& reader, std::span<const uint8_t> file, PngLayout& layout, const ReadOptions& options,
+                PictureRecord& picture) {
   RETURN_IF_BAD(ReadHeader(reader));
   layout = ChooseLayout(reader);
   const int32_t frames = FrameCount(file);
-  picture.pageCount = settings.RecognizeAPNG != 0 ? frames : 1;
+  picture.pageCount = options.recognizeApng ? frames : 1;
   picture.simplified = frames > 1 || png_get_bit_depth(reader.png, reader.info) > 8;
   picture.typeName.AssignCut(picture.pageCount > 1 ? "Animated PNG" : "Portable Network Graphics");
   picture.width = layout.width;
@@ -452,34 +452,34 @@ bool HoldsFurtherTexts(std::span<const uint8_t> file) {
 
 }  // namespace
 
-Status DescribePng(std::span<const uint8_t> file, PictureRecord& picture) {
+Status DescribePng(std::span<const uint8_t> file, const ReadOptions& options, PictureRecord& picture) {
   PngReader reader(file);
   PngLayout layout;
-  return Describe(reader, file, layout, picture);
+  return Describe(reader, file, layout, options, picture);
 }
 
-Status DecodePng(std::span<const uint8_t> file, PictureRecord& picture) {
+Status DecodePng(std::span<const uint8_t> file, const ReadOptions& options, PictureRecord& picture) {
   PngReader reader(file);
   PngLayout layout;
-  RETURN_IF_BAD(Describe(reader, file, layout, picture));
+  RETURN_IF_BAD(Describe(reader, file, layout, options, picture));
   return ReadPixels(reader, layout, picture);
 }
 
-Status PngInfo(PictureRecord& picture, const char* fileName, uint32_t) {
+Status PngInfo(PictureRecord& picture, const ReadRequest& request) {
   picture.typeName.Clear();
   platform::FileView file;
-  if (!file.Open(fileName)) return Status::FileOpenError;
+  if (!file.Open(request.fileName)) return Status::FileOpenError;
   picture.fileSize = file.FileSize();
-  return DescribePng(file.Bytes(), picture);
+  return DescribePng(file.Bytes(), request.options, picture);
 }
 
-Status PngRead(PictureRecord& picture, const char* fileName) {
+Status PngRead(PictureRecord& picture, const ReadRequest& request) {
   const ProgressScope progress(picture);
   picture.image.Free();
   picture.alpha.Free();
   platform::FileView file;
-  if (!file.Open(fileName)) return Status::FileOpenError;
-  RETURN_IF_BAD(DecodePng(file.Bytes(), picture));
+  if (!file.Open(request.fileName)) return Status::FileOpenError;
+  RETURN_IF_BAD(DecodePng(file.Bytes(), request.options, picture));
   picture.simplified = picture.simplified || HoldsFurtherTexts(file.Bytes());
   return Status::Ok;
 }

@@ -4,22 +4,23 @@
 
 #include "core/byte_writer.h"
 #include "picture/picture_record.h"
+#include "picture/read_request.h"
 #include "picture/write_options.h"
 
 namespace fotomill {
 
 // Portable Network Graphics. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when the file is cut short,
 // MemoryAllocationError (6).
-Status PngInfo(PictureRecord& picture, const char* fileName, uint32_t flags);
-Status PngRead(PictureRecord& picture, const char* fileName);
+Status PngInfo(PictureRecord& picture, const ReadRequest& request);
+Status PngRead(PictureRecord& picture, const ReadRequest& request);
 // Also ErrorCreatingFile (10), ErrorWritingFile (11).
 Status PngWrite(PictureRecord& picture, const WriteOptions& options);
 Status PngDetails(PictureRecord& picture);
 
 // The same for a file that lies in memory, as containers hold them. Statuses as above.
-Status DescribePng(std::span<const uint8_t> file, PictureRecord& picture);
-Status DecodePng(std::span<const uint8_t> file, PictureRecord& picture);
+Status DescribePng(std::span<const uint8_t> file, const ReadOptions& options, PictureRecord& picture);
+Status DecodePng(std::span<const uint8_t> file, const ReadOptions& options, PictureRecord& picture);
 // Appends a PNG file of the picture's pixels, without metadata, to `out`.
-Status EncodePng(const PictureRecord& picture, ByteWriter& out);
+Status EncodePng(const PictureRecord& picture, const EncodeOptions& options, ByteWriter& out);
 
 }  // namespace fotomill

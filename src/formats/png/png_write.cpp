@@ -11,7 +11,6 @@
 #include "formats/png/png_library.h"
 #include "processing/pixel_rows.h"
 #include "processing/promote.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -116,7 +115,7 @@ void MergeRow(const BgrRows& colors, const PackedImage& alpha, int32_t y, uint8_
   }
 }
 
-Status WritePixels(const PictureRecord& picture, ByteWriter& out) {
+Status WritePixels(const PictureRecord& picture, int32_t compression, ByteWriter& out) {
   const PackedImage& image = picture.image;
   const int32_t width = image.Width();
   BgrRows colors;
@@ -136,7 +135,7 @@ Status WritePixels(const PictureRecord& picture, ByteWriter& out) {
   };
   const int type = ColorType(picture);  // palettes and pixels within a byte have no neighbours to differ from
   const bool filtered = type != PNG_COLOR_TYPE_PALETTE && DepthOf(picture) == 8;
-  return WritePngPixels(rows, filtered, settings.PngCompression, out, [&](int32_t y) { picture.ReportRow(y); });
+  return WritePngPixels(rows, filtered, compression, out, [&](int32_t y) { picture.ReportRow(y); });
 }
 
 void WriteEnd(ByteWriter& out) {
@@ -147,7 +146,7 @@ void WriteEnd(ByteWriter& out) {
 }
 
 // `keep`: whether metadata and comment go along; `lost`: what of them could not.
-Status WriteAll(PngWriter& writer, const PictureRecord& picture, bool keep, uint8_t& lost) {
+Status WriteAll(PngWriter& writer, const PictureRecord& picture, const EncodeOptions& options, bool keep, uint8_t& lost) {
   const std::string xmp(picture.metadata.xmp.begin(), picture.metadata.xmp.end());
   const std::string comment(picture.comment.begin(), picture.comment.end());
   const bool written = PngGuarded(writer.png, [&] {
@@ -159,18 +158,18 @@ Status WriteAll(PngWriter& writer, const PictureRecord& picture, bool keep, uint
     png_write_info(writer.png, writer.info);
   });
   if (!written) return Status::ErrorWritingFile;
-  RETURN_IF_BAD(WritePixels(picture, writer.out));
+  RETURN_IF_BAD(WritePixels(picture, options.pngCompression, writer.out));
   WriteEnd(writer.out);
   return Status::Ok;
 }
 
 }  // namespace
 
-Status EncodePng(const PictureRecord& picture, ByteWriter& out) {
+Status EncodePng(const PictureRecord& picture, const EncodeOptions& options, ByteWriter& out) {
   PngWriter writer(out);
   if (!writer.Ready()) return Status::MemoryAllocationError;
   uint8_t lost = 0;
-  return WriteAll(writer, picture, false, lost);
+  return WriteAll(writer, picture, options, false, lost);
 }
 
 Status PngWrite(PictureRecord& picture, const WriteOptions& options) {
@@ -180,7 +179,7 @@ Status PngWrite(PictureRecord& picture, const WriteOptions& options) {
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
   PngWriter writer(out);
   if (!writer.Ready()) return Status::MemoryAllocationError;
-  RETURN_IF_BAD(WriteAll(writer, picture, options.keepMetadata && settings.PreserveEXIF != 0, picture.lostMetadata));
+  RETURN_IF_BAD(WriteAll(writer, picture, options.encode, options.KeepsMetadata(), picture.lostMetadata));
   return CommitOutput(out, options);
 }
 

@@ -34,7 +34,6 @@
 #include "core/byte_reader.h"
 #include "core/byte_writer.h"
 #include "platform/file_view.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -314,13 +313,13 @@ struct TgaLayout {
   int32_t attributeBits = 0;
 };
 
-TgaLayout ChooseLayout(const PictureRecord& picture) {
+TgaLayout ChooseLayout(const PictureRecord& picture, bool in16Bits) {
   if (picture.image.Bits() <= 8) {
     const bool isGray = picture.image.Bits() == 8 && picture.palette == GrayRamp();
     return {isGray ? kGray : kMapped, 8, 0};
   }
   const bool alpha = !picture.alpha.Empty();
-  if (settings.CreateTarga16 != 0) return {kTrueColor, 16, alpha ? 1 : 0};
+  if (in16Bits) return {kTrueColor, 16, alpha ? 1 : 0};
   return {kTrueColor, alpha ? 32 : 24, alpha ? 8 : 0};
 }
 
@@ -387,22 +386,22 @@ Status TakeHead(std::span<const uint8_t> file, TgaHeader& header, ColorMap& map,
 
 }  // namespace
 
-Status TgaInfo(PictureRecord& picture, const char* fileName, uint32_t) {
+Status TgaInfo(PictureRecord& picture, const ReadRequest& request) {
   picture.typeName.Clear();
   platform::FileView file;
-  if (!file.OpenHead(fileName, 65536)) return Status::FileOpenError;
+  if (!file.OpenHead(request.fileName.c_str(), 65536)) return Status::FileOpenError;
   picture.fileSize = file.FileSize();
   TgaHeader header;
   ColorMap map;
   return TakeHead(file.Bytes(), header, map, picture);
 }
 
-Status TgaRead(PictureRecord& picture, const char* fileName) {
+Status TgaRead(PictureRecord& picture, const ReadRequest& request) {
   const ProgressScope progress(picture);
   picture.image.Free();
   picture.alpha.Free();
   platform::FileView file;
-  if (!file.Open(fileName)) return Status::FileOpenError;
+  if (!file.Open(request.fileName)) return Status::FileOpenError;
   TgaHeader header;
   ColorMap map;
   RETURN_IF_BAD(TakeHead(file.Bytes(), header, map, picture));
@@ -431,7 +430,7 @@ Status TgaWrite(PictureRecord& picture, const WriteOptions& options) {
   if (image.Width() > UINT16_MAX || image.Height() > UINT16_MAX) return Status::UnsuitableImage;
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
-  const TgaLayout layout = ChooseLayout(picture);
+  const TgaLayout layout = ChooseLayout(picture, options.encode.targa16);
   WriteHeader(out, picture, layout);
   std::vector<uint8_t> row(static_cast<size_t>(image.Width()) * static_cast<size_t>(layout.bits / 8));
   for (int32_t r = 0; r < image.Height() && !out.Failed(); ++r) {

@@ -1,14 +1,15 @@
 #pragma once
 
 #include "picture/picture_record.h"
+#include "picture/read_request.h"
 #include "picture/write_options.h"
 
 namespace fotomill {
 
 // Truevision Targa. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when data are cut short,
 // MemoryAllocationError (6), UnsupportedFormat (8) for the types that are not read, NoImages (20) for type 0.
-Status TgaInfo(PictureRecord& picture, const char* fileName, uint32_t flags);
-Status TgaRead(PictureRecord& picture, const char* fileName);
+Status TgaInfo(PictureRecord& picture, const ReadRequest& request);
+Status TgaRead(PictureRecord& picture, const ReadRequest& request);
 // Also UnsuitableImage (13) for sizes over 65535, ErrorCreatingFile (10), ErrorWritingFile (11).
 Status TgaWrite(PictureRecord& picture, const WriteOptions& options);
 

@@ -225,13 +225,13 @@ bool HoldsFurtherTags(TIFF* tiff) {
   return false;
 }
 
-// Opens the page that the record asks for and fills the facts.
-Status Describe(TiffInput& input, TiffLayout& layout, PictureRecord& picture) {
+// Opens a page and fills the facts.
+Status Describe(TiffInput& input, int32_t page, TiffLayout& layout, PictureRecord& picture) {
   RETURN_IF_BAD(input.Open());
   TIFF* tiff = input.Handle();
   const tdir_t pages = std::clamp<tdir_t>(TIFFNumberOfDirectories(tiff), 1, kMostPages);
-  if (picture.page < 0 || static_cast<tdir_t>(picture.page) >= pages) return Status::NoImages;
-  if (TIFFSetDirectory(tiff, static_cast<tdir_t>(picture.page)) == 0) return input.Failure();
+  if (page < 0 || static_cast<tdir_t>(page) >= pages) return Status::NoImages;
+  if (TIFFSetDirectory(tiff, static_cast<tdir_t>(page)) == 0) return input.Failure();
   RETURN_IF_BAD(ReadLayout(tiff, layout));
   picture.pageCount = static_cast<int32_t>(pages);
   picture.typeName.AssignCut(TIFFIsBigTIFF(tiff) != 0 ? "BigTIFF" : "TIFF");
@@ -549,26 +549,26 @@ void AddDetails(TIFF* tiff, const TiffLayout& layout, const PictureRecord& pictu
 
 }  // namespace
 
-Status TiffInfo(PictureRecord& picture, const char* fileName, uint32_t) {
+Status TiffInfo(PictureRecord& picture, const ReadRequest& request) {
   picture.typeName.Clear();
   platform::FileView file;
-  if (!file.Open(fileName)) return Status::FileOpenError;
+  if (!file.Open(request.fileName)) return Status::FileOpenError;
   picture.fileSize = file.FileSize();
   TiffInput input(file.Bytes());
   TiffLayout layout;
-  return Describe(input, layout, picture);
+  return Describe(input, request.page, layout, picture);
 }
 
-Status TiffRead(PictureRecord& picture, const char* fileName) {
+Status TiffRead(PictureRecord& picture, const ReadRequest& request) {
   const ProgressScope progress(picture);
   picture.image.Free();
   picture.alpha.Free();
   picture.warning.Clear();
   platform::FileView file;
-  if (!file.Open(fileName)) return Status::FileOpenError;
+  if (!file.Open(request.fileName)) return Status::FileOpenError;
   TiffInput input(file.Bytes());
   TiffLayout layout;
-  RETURN_IF_BAD(Describe(input, layout, picture));
+  RETURN_IF_BAD(Describe(input, request.page, layout, picture));
   input.Messages() = {};
   const Status status = ReadPixels(input, layout, picture);
   if (status == Status::Ok && file.Intact()) {
@@ -587,7 +587,7 @@ Status TiffDetails(PictureRecord& picture) {
   if (!file.Open(picture.fileName.c_str())) return Status::FileOpenError;
   TiffInput input(file.Bytes());
   TiffLayout layout;
-  RETURN_IF_BAD(Describe(input, layout, picture));
+  RETURN_IF_BAD(Describe(input, 0, layout, picture));
   AddDetails(input.Handle(), layout, picture, picture.detailLines);
   return Status::Ok;
 }

@@ -1,15 +1,16 @@
 #pragma once
 
 #include "picture/picture_record.h"
+#include "picture/read_request.h"
 #include "picture/write_options.h"
 
 namespace fotomill {
 
 // TIFF and BigTIFF. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when the file ends before its pixels,
 // MemoryAllocationError (6), UnsupportedFormat (8) for samples or compressions that are not decoded, NoImages (20) for a
-// page that is not there. Reads page `picture.page`.
-Status TiffInfo(PictureRecord& picture, const char* fileName, uint32_t flags);
-Status TiffRead(PictureRecord& picture, const char* fileName);
+// page that is not there. Reads the request's page.
+Status TiffInfo(PictureRecord& picture, const ReadRequest& request);
+Status TiffRead(PictureRecord& picture, const ReadRequest& request);
 // Also ErrorCreatingFile (10), ErrorWritingFile (11).
 Status TiffWrite(PictureRecord& picture, const WriteOptions& options);
 Status TiffDetails(PictureRecord& picture);

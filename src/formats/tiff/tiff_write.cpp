@@ -14,7 +14,6 @@
 #include "formats/tiff/tiff_file.h"
 #include "formats/tiff/tiff_lzw.h"
 #include "processing/pixel_rows.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -45,8 +44,8 @@ struct TiffPlan {
   bool invert = false;   // faxes are black on white
 };
 
-uint16_t CompressionFor(const TiffPlan& plan, Grays grays) {
-  switch (std::clamp<int32_t>(settings.TiffOptions, choice::kTiffNone, choice::kTiffJpeg)) {
+uint16_t CompressionFor(const TiffPlan& plan, Grays grays, int32_t choice) {
+  switch (std::clamp<int32_t>(choice, choice::kTiffNone, choice::kTiffJpeg)) {
     case choice::kTiffNone: return COMPRESSION_NONE;
     case choice::kTiffPackBits: return COMPRESSION_PACKBITS;
     case choice::kTiffCcitt: return plan.bits == 1 && grays != Grays::No ? COMPRESSION_CCITTFAX4 : COMPRESSION_LZW;
@@ -58,13 +57,13 @@ uint16_t CompressionFor(const TiffPlan& plan, Grays grays) {
   }
 }
 
-TiffPlan MakePlan(const PictureRecord& picture) {
+TiffPlan MakePlan(const PictureRecord& picture, int32_t compression) {
   TiffPlan plan;
   const Grays grays = GraysOf(picture);
   const bool color = picture.image.Bits() == 24;
   plan.bits = static_cast<uint16_t>(color ? 8 : picture.image.Bits());
   plan.samples = static_cast<uint16_t>(!color ? 1 : picture.alpha.Empty() ? 3 : 4);
-  plan.compression = CompressionFor(plan, grays);
+  plan.compression = CompressionFor(plan, grays, compression);
   if (!color) {
     plan.photometric = grays == Grays::Rising    ? PHOTOMETRIC_MINISBLACK
                        : grays == Grays::Falling ? PHOTOMETRIC_MINISWHITE
@@ -90,7 +89,7 @@ void SetColors(TIFF* tiff, const PictureRecord& picture) {
   TIFFSetField(tiff, TIFFTAG_COLORMAP, channels[0].data(), channels[1].data(), channels[2].data());
 }
 
-void SetLayout(TIFF* tiff, const PictureRecord& picture, const TiffPlan& plan) {
+void SetLayout(TIFF* tiff, const PictureRecord& picture, const TiffPlan& plan, int32_t jpegQuality) {
   const PackedImage& image = picture.image;
   TIFFSetField(tiff, TIFFTAG_IMAGEWIDTH, static_cast<uint32_t>(image.Width()));
   TIFFSetField(tiff, TIFFTAG_IMAGELENGTH, static_cast<uint32_t>(image.Height()));
@@ -106,7 +105,7 @@ void SetLayout(TIFF* tiff, const PictureRecord& picture, const TiffPlan& plan) {
     TIFFSetField(tiff, TIFFTAG_EXTRASAMPLES, 1, &kind);
   }
   if (plan.compression == COMPRESSION_JPEG) {
-    TIFFSetField(tiff, TIFFTAG_JPEGQUALITY, std::clamp<int>(settings.JpegCompression, 1, 100));
+    TIFFSetField(tiff, TIFFTAG_JPEGQUALITY, std::clamp<int>(jpegQuality, 1, 100));
     if (plan.photometric == PHOTOMETRIC_YCBCR) TIFFSetField(tiff, TIFFTAG_JPEGCOLORMODE, JPEGCOLORMODE_RGB);
   }
   const uint64_t rowBytes = (static_cast<uint64_t>(image.Width()) * plan.bits * plan.samples + 7) / 8;
@@ -156,12 +155,13 @@ void WriteExif(TiffOutput& output, const ExifDirectories& directories) {
   if (placed.gpsOffset != 0) TIFFSetField(output.Handle(), TIFFTAG_GPSIFD, uint64_t{placed.gpsOffset});
 }
 
-void SetMetadata(TiffOutput& output, PictureRecord& picture, bool keep) {
+void SetMetadata(TiffOutput& output, PictureRecord& picture, const WriteOptions& options) {
+  const bool keep = options.KeepsMetadata();
   TIFF* tiff = output.Handle();
   const PictureMetadata& metadata = picture.metadata;
   TIFFSetField(tiff, TIFFTAG_RESOLUTIONUNIT, RESUNIT_INCH);
-  TIFFSetField(tiff, TIFFTAG_XRESOLUTION, metadata.dpiX > 0 ? metadata.dpiX : settings.TiffResolution);
-  TIFFSetField(tiff, TIFFTAG_YRESOLUTION, metadata.dpiY > 0 ? metadata.dpiY : settings.TiffResolution);
+  TIFFSetField(tiff, TIFFTAG_XRESOLUTION, metadata.dpiX > 0 ? metadata.dpiX : options.encode.resolution);
+  TIFFSetField(tiff, TIFFTAG_YRESOLUTION, metadata.dpiY > 0 ? metadata.dpiY : options.encode.resolution);
   if (!keep || picture.metadata.exif.empty()) TIFFSetField(tiff, TIFFTAG_SOFTWARE, std::string(kCreator).c_str());
   if (!keep) return;
   const ExifDirectories exif = ParseExifBlock(metadata.exif);
@@ -234,13 +234,13 @@ Status WriteLzwStrips(TIFF* tiff, const PictureRecord& picture, const TiffPlan& 
   return Status::Ok;
 }
 
-Status WriteAll(ByteWriter& out, PictureRecord& picture, bool keep) {
+Status WriteAll(ByteWriter& out, PictureRecord& picture, const WriteOptions& options) {
   TiffOutput output(out);
   if (!output.Open()) return Status::MemoryAllocationError;
   TIFF* tiff = output.Handle();
-  const TiffPlan plan = MakePlan(picture);
-  SetLayout(tiff, picture, plan);
-  SetMetadata(output, picture, keep);
+  const TiffPlan plan = MakePlan(picture, options.encode.tiffCompression);
+  SetLayout(tiff, picture, plan, options.encode.jpegQuality);
+  SetMetadata(output, picture, options);
   const size_t rowBytes = (static_cast<size_t>(picture.image.Width()) * plan.bits * plan.samples + 7) / 8;
   const bool lzw = plan.compression == COMPRESSION_LZW;
   RETURN_IF_BAD((lzw ? WriteLzwStrips : WriteScanlines)(tiff, picture, plan, rowBytes));
@@ -254,7 +254,7 @@ Status TiffWrite(PictureRecord& picture, const WriteOptions& options) {
   if (picture.image.Empty()) return Status::MemoryAllocationError;
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
-  RETURN_IF_BAD(WriteAll(out, picture, options.keepMetadata && settings.PreserveEXIF != 0));
+  RETURN_IF_BAD(WriteAll(out, picture, options));
   return CommitOutput(out, options);
 }
 

@@ -27,7 +27,6 @@
 #include "core/byte_writer.h"
 #include "core/limits.h"
 #include "platform/file_view.h"
-#include "settings/settings.h"
 
 namespace fotomill {
 
@@ -213,9 +212,8 @@ Status DrawFrame(WebpFile& file, size_t index, Canvas& target) {
   return ReadFrame(frame, target);
 }
 
-// The canvas as it is with frame `page` on it.
-Status ReadWithAlpha(WebpFile& file, const PictureRecord& picture, Canvas& target) {
-  const int32_t frames = picture.page + 1;
+// The canvas as it is with the last of `frames` frames on it.
+Status ReadWithAlpha(WebpFile& file, int32_t frames, const PictureRecord& picture, Canvas& target) {
   for (int32_t i = 0; i < frames; ++i) {
     RETURN_IF_BAD(DrawFrame(file, static_cast<size_t>(i), target));
     picture.ReportRow(i, frames);
@@ -247,7 +245,7 @@ Status ReadOpaque(const WebpFile& file, const PictureRecord& picture, Canvas& ta
 
 class WebpAnimation final : public Animation {
  public:
-  Status Open(const char* fileName) {
+  Status Open(const std::string& fileName) {
     if (!view_.Open(fileName)) return Status::FileOpenError;
     RETURN_IF_BAD(ParseFile(view_.Bytes(), file_));
     for (const WebpFrame& frame : file_.frames) delays_.push_back(frame.duration);
@@ -283,11 +281,11 @@ void FillRow(const PictureRecord& picture, int32_t y, uint32_t* target) {
   }
 }
 
-Status Encode(const PictureRecord& picture, bool lossless, int32_t quality, WebPMemoryWriter& encoded) {
+Status Encode(const PictureRecord& picture, bool lossless, int32_t factor, WebPMemoryWriter& encoded) {
   WebPConfig config;
   WebPPicture source;
-  const auto factor = static_cast<float>(std::clamp<int32_t>(quality > 0 ? quality : settings.WebPQualityFactor, 0, 100));
-  if (WebPConfigPreset(&config, WEBP_PRESET_DEFAULT, factor) == 0 || WebPPictureInit(&source) == 0) return Status::ResourceError;
+  const auto quality = static_cast<float>(std::clamp<int32_t>(factor, 0, 100));
+  if (WebPConfigPreset(&config, WEBP_PRESET_DEFAULT, quality) == 0 || WebPPictureInit(&source) == 0) return Status::ResourceError;
   config.lossless = lossless ? 1 : 0;
   config.exact = lossless ? 1 : 0;
   source.use_argb = 1;
@@ -352,10 +350,10 @@ struct EncodedFile {
 
 }  // namespace
 
-Status WebpInfo(PictureRecord& picture, const char* fileName, uint32_t) {
+Status WebpInfo(PictureRecord& picture, const ReadRequest& request) {
   picture.typeName.Clear();
   platform::FileView view;
-  if (!view.Open(fileName)) return Status::FileOpenError;
+  if (!view.Open(request.fileName)) return Status::FileOpenError;
   picture.fileSize = view.FileSize();
   WebpFile file;
   RETURN_IF_BAD(ParseFile(view.Bytes(), file));
@@ -363,21 +361,21 @@ Status WebpInfo(PictureRecord& picture, const char* fileName, uint32_t) {
   return Status::Ok;
 }
 
-Status WebpRead(PictureRecord& picture, const char* fileName) {
+Status WebpRead(PictureRecord& picture, const ReadRequest& request) {
   const ProgressScope progress(picture);
   picture.image.Free();
   picture.alpha.Free();
   platform::FileView view;
-  if (!view.Open(fileName)) return Status::FileOpenError;
+  if (!view.Open(request.fileName)) return Status::FileOpenError;
   WebpFile file;
   RETURN_IF_BAD(ParseFile(view.Bytes(), file));
   Describe(file, picture);
-  if (picture.page < 0 || picture.page >= picture.pageCount) return Status::NoImages;
+  if (request.page < 0 || request.page >= picture.pageCount) return Status::NoImages;
   const bool canvas = file.alpha || file.frames.size() > 1;
   Canvas target;
   RETURN_IF_BAD(NewPackedImage(file.width, file.height, &picture.palette, 24, target.image));
   if (canvas) RETURN_IF_BAD(NewAlphaPlane(file.width, file.height, target.alpha));
-  RETURN_IF_BAD(canvas ? ReadWithAlpha(file, picture, target) : ReadOpaque(file, picture, target));
+  RETURN_IF_BAD(canvas ? ReadWithAlpha(file, request.page + 1, picture, target) : ReadOpaque(file, picture, target));
   if (!view.Intact()) return Status::FileReadError;
   if (canvas && !file.alpha) DropOpaqueAlpha(target);
   picture.image = std::move(target.image);
@@ -385,9 +383,9 @@ Status WebpRead(PictureRecord& picture, const char* fileName) {
   return Status::Ok;
 }
 
-Status WebpAnimate(const char* fileName, AnimationPointer& animation) {
+Status WebpAnimate(const ReadRequest& request, AnimationPointer& animation) {
   auto opened = std::make_unique<WebpAnimation>();
-  RETURN_IF_BAD(opened->Open(fileName));
+  RETURN_IF_BAD(opened->Open(request.fileName));
   animation = std::move(opened);
   return Status::Ok;
 }
@@ -398,15 +396,15 @@ Status WebpWrite(PictureRecord& picture, const WriteOptions& options) {
   if (picture.image.Width() > WEBP_MAX_DIMENSION || picture.image.Height() > WEBP_MAX_DIMENSION) return Status::UnsuitableImage;
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
-  const bool lossless = options.lossless || (options.quality == 0 && settings.WebPLossless != 0);
+  const bool lossless = options.lossless || options.encode.webpLossless;
   EncodedFile encoded, other;
-  RETURN_IF_BAD(Encode(picture, lossless, options.quality, encoded.writer));
-  const bool mixed = !options.lossless && options.quality == 0 && settings.WebPAllowMixed != 0;
-  if (mixed) RETURN_IF_BAD(Encode(picture, !lossless, 0, other.writer));
+  const int32_t quality = options.encode.webpQuality;
+  RETURN_IF_BAD(Encode(picture, lossless, quality, encoded.writer));
+  if (!options.lossless && options.encode.webpMixed) RETURN_IF_BAD(Encode(picture, !lossless, quality, other.writer));
   const bool useOther = other.writer.size > 0 && other.writer.size < encoded.writer.size;
   const WebPMemoryWriter& chosen = useOther ? other.writer : encoded.writer;
   const std::span<const uint8_t> bytes(chosen.mem, chosen.size);
-  const bool keep = options.keepMetadata && settings.PreserveEXIF != 0 && !picture.metadata.Empty();
+  const bool keep = options.KeepsMetadata() && !picture.metadata.Empty();
   if (keep && bytes.size() > kFileHead) {
     WriteFile(out, picture, bytes);
   } else {

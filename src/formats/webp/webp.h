@@ -2,6 +2,7 @@
 
 #include "picture/animation.h"
 #include "picture/picture_record.h"
+#include "picture/read_request.h"
 #include "picture/write_options.h"
 
 namespace fotomill {
@@ -9,9 +10,9 @@ namespace fotomill {
 // WebP. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when the file ends before its pixels,
 // MemoryAllocationError (6), UnsupportedFormat (8), NoImages (20) for a frame that is not there. Frames of an animation are
 // pages.
-Status WebpInfo(PictureRecord& picture, const char* fileName, uint32_t flags);
-Status WebpRead(PictureRecord& picture, const char* fileName);
-Status WebpAnimate(const char* fileName, AnimationPointer& animation);
+Status WebpInfo(PictureRecord& picture, const ReadRequest& request);
+Status WebpRead(PictureRecord& picture, const ReadRequest& request);
+Status WebpAnimate(const ReadRequest& request, AnimationPointer& animation);
 // Also UnsuitableImage (13) for sides over 16383, ErrorCreatingFile (10), ErrorWritingFile (11).
 Status WebpWrite(PictureRecord& picture, const WriteOptions& options);
 

@@ -235,19 +235,19 @@ Status DescribePicture(const platform::FileView& file, PictureRecord& picture) {
 
 }  // namespace
 
-Status XbmInfo(PictureRecord& picture, const char* fileName, uint32_t flags) {
-  if ((flags & kInfoSignedOnly) != 0) return Status::UnsupportedFormat;
+Status XbmInfo(PictureRecord& picture, const ReadRequest& request) {
+  if (request.signedOnly) return Status::UnsupportedFormat;
   platform::FileView file;
-  if (!file.OpenHead(fileName, limits.textScanBytes)) return Status::FileOpenError;
+  if (!file.OpenHead(request.fileName.c_str(), limits.textScanBytes)) return Status::FileOpenError;
   return DescribePicture(file, picture);
 }
 
-Status XbmRead(PictureRecord& picture, const char* fileName) {
+Status XbmRead(PictureRecord& picture, const ReadRequest& request) {
   const ProgressScope progress(picture);
   picture.image.Free();
   picture.alpha.Free();
   platform::FileView file;
-  if (!file.Open(fileName)) return Status::FileOpenError;
+  if (!file.Open(request.fileName)) return Status::FileOpenError;
   RETURN_IF_BAD(DescribePicture(file, picture));
   XbmText text(file.Bytes());
   if (!SkipToValues(text) || text.Left() / kValueBytes < picture.imageBytes) return Status::DamagedFile;

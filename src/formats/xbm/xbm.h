@@ -1,12 +1,13 @@
 #pragma once
 
 #include "picture/picture_record.h"
+#include "picture/read_request.h"
 #include "picture/write_options.h"
 
 namespace fotomill {
 
-Status XbmInfo(PictureRecord& picture, const char* fileName, uint32_t flags);
-Status XbmRead(PictureRecord& picture, const char* fileName);
+Status XbmInfo(PictureRecord& picture, const ReadRequest& request);
+Status XbmRead(PictureRecord& picture, const ReadRequest& request);
 Status XbmWrite(PictureRecord& picture, const WriteOptions& options);
 
 }  // namespace fotomill

@@ -8,6 +8,7 @@
 #include "desktop/models/browser/browser_model.h"
 #include "platform/paths.h"
 #include "registry/registry.h"
+#include "settings/job_options.h"
 
 namespace fotomill::desktop {
 
@@ -28,7 +29,7 @@ std::string Beginning(std::string_view text) {
 // What only the file's header tells.
 void AddHeaderLines(const std::string& path, Status known, std::vector<std::string>& lines) {
   PicturePointer picture;
-  const Status status = LoadPictureInfo(path.c_str(), picture);
+  const Status status = LoadPictureInfo({.fileName = path, .options = ReadOptionsFromSettings()}, picture);
   const Status problem = status != Status::Ok ? status : known;
   if (problem != Status::Ok) lines.emplace_back(StatusMessage(problem));
   if (status != Status::Ok) return;

@@ -10,6 +10,7 @@
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "registry/registry.h"
+#include "settings/job_options.h"
 
 namespace fotomill::desktop {
 
@@ -88,7 +89,7 @@ void AddFacts(const std::string& folder, FolderListing& listing, const StopToken
 void AddPictureFacts(const std::string& folder, FolderItem& item) {
   const std::string path = platform::JoinFolder(folder, item.name);
   PicturePointer picture;
-  if (LoadPictureInfo(path.c_str(), picture) != Status::Ok) return;
+  if (LoadPictureInfo({.fileName = path, .options = ReadOptionsFromSettings()}, picture) != Status::Ok) return;
   item.width = picture->width;
   item.height = picture->height;
   item.bits = picture->bitsPerPixel;

@@ -10,6 +10,7 @@
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "registry/registry.h"
+#include "settings/job_options.h"
 #include "settings/settings.h"
 
 namespace fotomill::desktop {
@@ -42,10 +43,10 @@ Status ToRecord(const PastedPicture& pasted, PictureRecord& picture) {
 
 // Writes it under a name that is free there, and says which.
 Status Write(const PastedPicture& pasted, const std::string& folder, std::string& path) {
-  const PicturePointer picture = NewPictureRecord();
+  const PicturePointer picture = NewPictureRecord(ReadOptionsFromSettings().alphaBackground);
   if (picture == nullptr) return Status::MemoryAllocationError;
   RETURN_IF_BAD(ToRecord(pasted, *picture));
-  WriteOptions options;
+  WriteOptions options{.encode = EncodeOptionsFromSettings()};
   options.existing = platform::Existing::Refuse;
   Status status = Status::ErrorCreatingFile;
   for (int race = 0; race < kMostLostRaces; ++race) {

@@ -10,6 +10,7 @@
 #include "platform/folders.h"
 #include "platform/paths.h"
 #include "platform/unchanged_file.h"
+#include "settings/job_options.h"
 #include "settings/settings.h"
 
 namespace fotomill::desktop {
@@ -73,11 +74,11 @@ DeedResult TurnOneFile(const std::string& path, Orientation turn) {
   if (platform::FactsOf(path).link)
     return {{DeedKind::Turn, {}}, {{path, "It is a link and stays; turn the file that it leads to."}}};
   PreviousFiles previous;
-  WriteOptions options;
+  WriteOptions options{.encode = EncodeOptionsFromSettings()};
   bool kept = true;
   options.makeWay = [&] { return kept = previous.Keep(path); };
   const TurnRequest request{.turn = turn, .seenByExif = settings.ExifAdjustOrientation != 0};
-  const TurnedFile turned = TurnPictureFile(path, path, request, options);
+  const TurnedFile turned = TurnPictureFile(path, path, request, ReadOptionsFromSettings(), options);
   if (turned.changed) previous.Replaced(path);
   DeedResult result{previous.Deed(), {}, turned.note};
   if (turned.status != Status::Ok) {

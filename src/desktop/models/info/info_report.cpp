@@ -174,7 +174,7 @@ FileInfo ReadFileInfo(const std::string& path, const InfoOptions& options) {
   InfoSection general{"General", {}};
   AddFileFacts(path, options, info, general);
   PicturePointer picture;
-  info.status = LoadPictureInfo(path.c_str(), picture);
+  info.status = LoadPictureInfo({.fileName = path, .options = ReadOptionsFromSettings()}, picture);
   if (info.status == Status::Ok) {
     AddPictureFacts(*picture, options, info, general);
     const FormatEntry& row = FormatRow(picture->formatIndex);

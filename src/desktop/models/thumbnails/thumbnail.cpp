@@ -149,19 +149,19 @@ void CopyFacts(const PictureRecord& picture, Thumbnail& thumbnail) {
 }
 
 // What a record does not know of files that may have several pages: it is quickly told by their heads.
-void ReadPages(const std::string& path, Thumbnail& thumbnail) {
+void ReadPages(const std::string& path, const ReadOptions& options, Thumbnail& thumbnail) {
   const int32_t format = FindFormatByName(path);
   PicturePointer picture;
   if (format == kNoFormat || format == kSpareRow || (FormatRow(format).flags & FMT_MULTI) == 0) return;
-  if (LoadPictureInfo(path.c_str(), picture) == Status::Ok) CopyFacts(*picture, thumbnail);
+  if (LoadPictureInfo({.fileName = path, .options = options}, picture) == Status::Ok) CopyFacts(*picture, thumbnail);
 }
 
 Status MakeFromPicture(const ThumbnailWish& wish, Thumbnail& thumbnail) {
   PicturePointer picture;
-  RETURN_IF_BAD(LoadPictureInfo(wish.path.c_str(), picture));
+  const ReadRequest request{.fileName = wish.path, .thumbnailSide = wish.side, .options = wish.options.read};
+  RETURN_IF_BAD(LoadPictureInfo(request, picture));
   CopyFacts(*picture, thumbnail);
-  picture->thumbnailSide = wish.side;
-  RETURN_IF_BAD(ReadPicture(*picture));
+  RETURN_IF_BAD(ReadPicture(request, *picture));
   thumbnail.alpha = !picture->alpha.Empty();
   RETURN_IF_BAD(PrepareForDisplay(*picture, wish.options.matte));
   ThumbnailRecord record;
@@ -175,7 +175,7 @@ Status MakeFromPicture(const ThumbnailWish& wish, Thumbnail& thumbnail) {
 ThumbnailPointer LoadThumbnail(const ThumbnailWish& wish) {
   auto thumbnail = std::make_shared<Thumbnail>();
   if (ReadReady(wish, *thumbnail)) {
-    ReadPages(wish.path, *thumbnail);
+    ReadPages(wish.path, wish.options.read, *thumbnail);
     return thumbnail;
   }
   if (wish.standIn) return ReadEmbedded(wish, *thumbnail) ? thumbnail : nullptr;

@@ -15,7 +15,7 @@ constexpr uint64_t kMostCanvasBytes = uint64_t{256} << 20;
 
 // A record of its own for the frame that the animation has on its canvas.
 Status CopyFrame(const PictureRecord& facts, const Canvas& canvas, PicturePointer& picture) {
-  picture = NewPictureRecord();
+  picture = NewPictureRecord(facts.defaultColour);
   if (picture == nullptr) return Status::MemoryAllocationError;
   picture->fileName = facts.fileName;
   picture->typeName = facts.typeName;
@@ -127,9 +127,9 @@ bool AnimationFrames::NextFrame(size_t& frame) const {
 }
 
 Status AnimationFrames::OpenFile() {
-  RETURN_IF_BAD(LoadPictureInfo(wish_.path.c_str(), facts_));
+  RETURN_IF_BAD(LoadPictureInfo({.fileName = wish_.path, .options = wish_.read}, facts_));
   if (EstimateImageBytes(facts_->width, facts_->height, 32) > kMostCanvasBytes) return Status::MemoryAllocationError;
-  return OpenAnimation(wish_.path.c_str(), animation_);
+  return OpenAnimation({.fileName = wish_.path, .options = wish_.read}, animation_);
 }
 
 // Composes frames from `position_`, the next one of the animation, up to the wanted one. Null when it cannot be had; the frames

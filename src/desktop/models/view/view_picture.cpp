@@ -45,9 +45,10 @@ const ColorTransform& TransformOf(const std::vector<uint8_t>& profile) {
 
 Status LoadInto(const ViewWish& wish, ViewPicture& view) {
   PicturePointer picture;
-  RETURN_IF_BAD(LoadPictureInfo(wish.path.c_str(), picture));
-  picture->page = wish.page;
-  RETURN_IF_BAD(ReadPicture(*picture));
+  ReadRequest request{.fileName = wish.path, .options = wish.read};
+  RETURN_IF_BAD(LoadPictureInfo(request, picture));
+  request.page = wish.page;
+  RETURN_IF_BAD(ReadPicture(request, *picture));
   return PrepareView(std::move(picture), view);
 }
 
@@ -123,7 +124,7 @@ ViewPicturePointer TurnedView(const ViewPicture& view, Orientation turn) {
   turned->wish = view.wish;
   turned->facts = view.facts;
   turned->photo = view.photo;
-  turned->picture = NewPictureRecord();
+  turned->picture = NewPictureRecord(view.wish.read.alphaBackground);
   if (turned->picture == nullptr) return nullptr;
   PictureRecord& picture = *turned->picture;
   if (OrientImage(old.image, turn, picture.image) != Status::Ok) return nullptr;
@@ -137,7 +138,6 @@ ViewPicturePointer TurnedView(const ViewPicture& view, Orientation turn) {
   picture.fileSize = old.fileSize;
   picture.formatIndex = old.formatIndex;
   picture.pageCount = old.pageCount;
-  picture.page = old.page;
   return turned;
 }
 

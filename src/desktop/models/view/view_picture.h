@@ -11,7 +11,9 @@
 #include "desktop/models/drawing/rgb_image.h"
 #include "picture/picture_record.h"
 #include "platform/files.h"
+#include "picture/read_request.h"
 #include "processing/geometry/orient.h"
+#include "settings/job_options.h"
 
 namespace fotomill::desktop {
 
@@ -35,6 +37,7 @@ struct ViewWish {
   int32_t page = 0;
   int32_t fitWidth = 0, fitHeight = 0;  // device pixels, 0 for none
   ViewLook look = ViewLook::FromSettings();
+  ReadOptions read = ReadOptionsFromSettings();
 
   // Whether both mean the same pixels, whatever window they are to fit.
   bool SamePicture(const ViewWish& other) const { return path == other.path && page == other.page && look == other.look; }

@@ -16,6 +16,7 @@
 #include "platform/folders.h"
 #include "platform/paths.h"
 #include "settings/configuration.h"
+#include "settings/format_switches.h"
 #include "settings/settings.h"
 
 namespace fotomill::desktop {
@@ -96,6 +97,7 @@ void MainFrame::FollowRename(const std::string& from, const std::string& to) {
 }
 
 void MainFrame::SettingsChanged() {
+  TakePluginOverride();
   thumbnails_.Clear();
   FilesChanged();
 }

@@ -1,0 +1,39 @@
+#include "settings/job_options.h"
+
+#include <gtest/gtest.h>
+
+#include "picture/encode_options.h"
+#include "picture/read_request.h"
+#include "registry/registry.h"
+#include "settings/key_table.h"
+#include "support/scoped_settings.h"
+
+namespace fotomill::test {
+namespace {
+
+TEST(JobOptions, DefaultsAreThoseOfTheSettings) {
+  const ScopedSettings keep;
+  for (const KeyRow& row : Keys()) StoreDefault(row);
+  EXPECT_EQ(ReadOptionsFromSettings(), ReadOptions());
+  EXPECT_EQ(EncodeOptionsFromSettings(), EncodeOptions());
+}
+
+// Every key that Setup shows for a format reaches its codec.
+TEST(JobOptions, HoldEveryKeyOfTheFormats) {
+  for (const FormatSettings* const codec : SettingsOfFormats()) {
+    for (const FormatSetting& setting : codec->keys) {
+      if (*setting.label == '\0') continue;
+      SCOPED_TRACE(setting.key);
+      const ScopedSettings keep;
+      const EncodeOptions encode = EncodeOptionsFromSettings();
+      const ReadOptions read = ReadOptionsFromSettings();
+      const KeyRow* const row = FindKey(setting.key);
+      ASSERT_NE(row, nullptr);
+      StoreNumber(*row, NumberIn(*row) == 0 ? 1 : 0);
+      EXPECT_TRUE(EncodeOptionsFromSettings() != encode || ReadOptionsFromSettings() != read);
+    }
+  }
+}
+
+}  // namespace
+}  // namespace fotomill::test
