@@ -8,13 +8,14 @@
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "registry/registry.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
 namespace {
 
-constexpr std::string_view kNotPlain = "The name cannot lead to another folder.";
-constexpr std::string_view kTooLong = "The path would be longer than 260 characters.";
+constexpr const char* kNotPlain = TrLater("The name must not contain a folder.");
+constexpr const char* kTooLong = TrLater("The path would be longer than 260 characters.");
 
 bool FitsPath(const std::string& path) { return path.size() <= PathText::Capacity(); }
 
@@ -56,7 +57,7 @@ bool AskName(Destination& destination, const std::string& source, std::string_vi
       destination.path = *whole;
       return true;
     }
-    question.problem = plain ? kTooLong : kNotPlain;
+    question.problem = Tr(plain ? kTooLong : kNotPlain);
   }
 }
 
@@ -114,7 +115,7 @@ DestinationAnswer AskAboutCollision(Destination& destination, const std::string&
     const bool renamed = !answer.checks.keepBoth && answer.name != base;
     std::string path = renamed ? WithBase(destination.path, answer.name) : destination.path;
     if (renamed && (!IsFileName(answer.name) || !FitsPath(path))) {
-      question.problem = IsFileName(answer.name) ? kTooLong : kNotPlain;
+      question.problem = Tr(IsFileName(answer.name) ? kTooLong : kNotPlain);
       continue;
     }
     StoreChecks(question.checks, answer.checks, job);
@@ -172,7 +173,7 @@ bool IsDestinationWanted(const BatchJob& job, bool intoFolder) {
   if (job.prompts == nullptr) return true;
   if (job.naming.confirmFormat && !ExtensionOfFormat(job).empty()) {
     const std::string format = UpperCase(ExtensionOfFormat(job));
-    if (!job.prompts->ConfirmFormat("Write files to the " + format + " format?")) return false;
+    if (!job.prompts->ConfirmFormat(Tr("Write files to the %1 format?", format))) return false;
   }
   const std::string& folder = job.destinationFolder;
   if (!intoFolder || folder.empty() || job.naming.beside) return true;

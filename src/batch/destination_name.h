@@ -8,6 +8,7 @@
 
 #include "batch/job.h"
 #include "batch/prompts.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -16,15 +17,15 @@ namespace fotomill {
 // extension, and places where either has no letter, stay as they are.
 std::string CasedExtension(std::string_view formatExtension, std::string_view sourceExtension, int32_t style);
 
-// Asks what has to be asked before anything is written: whether files of the format are wanted, and whether a destination
-// folder that is not there may be made (unless the outputs do not go `intoFolder`). False when the user wants something else.
+// Asks before anything is written: whether to write files of this format, and whether to create a missing destination folder
+// (if the outputs go `intoFolder`). False if the user declines.
 bool IsDestinationWanted(const BatchJob& job, bool intoFolder);
 
-// The extension of the job's outputs as the format has it.
+// The extension of the job's outputs, as the format spells it.
 std::string_view ExtensionOfFormat(const BatchJob& job);
 
-// The path of a source's output before anyone looks whether it is free: the job's destination folder with `below` behind it
-// (the source's own folder where there is none, or where the rules say so), prefix, base name, dot and extension.
+// The planned path of a source's output, free or not: the job's destination folder and `below` (or the source's folder, if there
+// is none or the rules say so), prefix, base name, dot and extension.
 std::string PlannedDestination(const std::string& source, std::string_view below, std::string_view prefix, const BatchJob& job);
 
 // The same for one of several outputs of a source.
@@ -43,18 +44,18 @@ std::optional<std::string> CompletedDestination(const std::string& destination, 
 // Whether a path cannot be had for a new file.
 using TakenTest = std::function<bool(const std::string& path)>;
 
-// Replaces `path` by the first of "NAME [first].EXT" to "NAME [last].EXT" that is not taken. False, with `path` as it was,
-// when all are, or when there is no number in the range.
+// Replaces `path` by the first of "NAME [first].EXT" to "NAME [last].EXT" that is not taken. False, with `path` unchanged,
+// when all are, or if there is no number in the range.
 bool MakeNumberedVariant(std::string& path, int64_t first, int64_t last, const TakenTest& taken);
 
-// The name of an output as it was settled.
+// The decision about an output's name.
 struct Destination {
   std::string path;
   bool replace = false;    // a file of that name is to be replaced
   bool recycle = false;    // and goes to the recycle bin
-  bool asked = false;      // because the user said so of this very file
+  bool asked = false;      // because the user said so for this very file
   std::string password;    // empty: none
-  bool elsewhere = false;  // the user chose another folder for it, which is not made
+  bool elsewhere = false;  // the user chose another folder, which is not created
   bool taken = false;      // the name was not free
   bool noVariant = false;  // skipped because no numbered variant is free
   int32_t formatIndex = kNoFormat;  // of the output; none: the job's
@@ -64,22 +65,22 @@ struct Destination {
 // The "path" of outputs that go to the clipboard, and the hint of a file for which no numbered
 // variant was free.
 inline constexpr std::string_view kClipboardName = "Clipboard";
-inline constexpr std::string_view kWriteAborted = "Unable to create a new file - write aborted.";
+inline constexpr std::string_view kWriteAborted = TrLater("Unable to create a new file - write aborted.");
 
 // Whether an output is written under its settled name, or its file is left out.
 enum class DestinationAnswer : int32_t { Write = 1, Skip = 2 };
 
-// Settles the name of an output, whose planned path stands in `destination`: asks for it where the settings say so, and what
-// is to become of a file that has it already. `title` says what the name is for, `picture` is the new picture for previews;
-// both may be missing. `variant` makes numbered variants.
+// Decides the name of an output, whose planned path is in `destination`: asks for it if the settings say so, and what to do if
+// the file exists. `title` says what the name is for, `picture` is the new picture for previews; both are optional. `variant`
+// makes numbered variants.
 using VariantMaker = std::function<bool(std::string& path)>;
 DestinationAnswer MakeDestinationName(Destination& destination, const std::string& source, std::string_view title, BatchJob& job,
                                       const TakenTest& taken, const VariantMaker& variant,
                                       const PictureRecord* picture = nullptr);
 
-// Whether a collision has to be shown to somebody.
+// Whether the user is asked about existing files.
 bool AsksAboutCollisions(const BatchJob& job);
-// What becomes of an output whose name is taken when nobody is asked.
+// The decision about an existing file without asking.
 DestinationAnswer SettleUnasked(Destination& destination, const OverwritePolicy& policy, bool applyToRest,
                                 const VariantMaker& variant);
 

@@ -5,6 +5,7 @@
 #include <string_view>
 
 #include "core/status.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -24,11 +25,11 @@ inline constexpr uint32_t kDoNotWait = 0x20000;
 
 // The message when no program is registered for a file, or it cannot be started.
 inline constexpr std::string_view kNoExternalProgram =
-    "The external player for the file type you selected cannot be found. Please consult the Fotomill Formats document for "
-    "more information about the format in question.";
+    TrLater("The external player for the file type you selected cannot be found. Please consult the Fotomill Formats document "
+            "for more information about the format in question.");
 
 // Opens a file with the program that the system has registered for it, and waits until that has ended unless kDoNotWait is
-// set. UnsupportedFunction, after a message, when there is none or it cannot be started.
+// set. UnsupportedFunction, after a message, if there is none or it cannot be started.
 Status OpenWithExternalProgram(ExternalProgramHost& host, const std::string& file, uint32_t flags);
 
 }  // namespace fotomill

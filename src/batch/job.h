@@ -14,6 +14,7 @@
 #include "core/workers/stop_token.h"
 #include "processing/palette/reduce.h"
 #include "registry/registry.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -32,7 +33,7 @@ struct OverwritePolicy {
 struct NamingOptions {
   int32_t extensionCase = 0;  // ExtensionCaseStyle
   bool askName = false;       // PromptForDestName
-  bool beside = false;        // DestForceSourceDir: every output lies beside its source
+  bool beside = false;        // DestForceSourceDir: every output is beside its source
   bool askPassword = false;   // PasswordProtect
   bool confirmFormat = true;  // WarnDestinationWrite: the format is asked about before anything is written
   int32_t firstVariant = 1, lastVariant = INT32_MAX;
@@ -54,9 +55,8 @@ struct SequentialRenameState {
   PathText baseName;
 };
 
-// What one running function carries along: what it was asked for and what came of it. Jobs of the user's settings come from
-// NewBatchJob; by itself a job has the built-in defaults, puts nothing in front of names, and keeps nothing. Belongs to the
-// thread that runs the batch.
+// The state of a running function: its request and its results. NewBatchJob creates jobs with the user's settings; a plain job
+// has the built-in defaults, adds no prefixes, and stores nothing. Belongs to the thread that runs the batch.
 struct BatchJob {
   // Abort: set by the button of the job's own progress box, or by its owner. Functions ask its token between files; what is in
   // work is finished, nothing new is begun. Whoever asks the program to end stops every job.
@@ -67,13 +67,13 @@ struct BatchJob {
                                     // kept, as its row may serve another one meanwhile
   std::string destinationFolder;    // empty: beside the source
   ProgressBox* box = nullptr;       // or none; not owned
-  Prompts* prompts = nullptr;       // none: nobody can be asked; not owned
+  Prompts* prompts = nullptr;       // none: no one can be asked; not owned
   bool errors = false;              // a file failed
   bool noSummary = false;           // no closing count line
   bool applyToRest = false;         // the overwrite prompt is not shown and counts as answered with OK
   uint32_t cataloguePage = 0;
   SequentialRenameState rename;
-  bool filesChanged = false;  // a file was renamed or written: browsers have to look again
+  bool filesChanged = false;  // a file was renamed or written: browsers must refresh
 
   OverwritePolicy overwrite;
   NamingOptions naming;
@@ -83,7 +83,7 @@ struct BatchJob {
   ProgressSettings boxSettings;
   uint32_t historyFunctions = ~0u;  // FileHistoryFunctions: a bit for each function whose files are recorded
   bool writeComments = false;       // into files of plug-in formats
-  // Keeps a value for good. Called on the thread that runs the batch; none: nothing is kept.
+  // Keeps a value permanently. Called on the thread that runs the batch; none: nothing is kept.
   std::function<void(Remembered what, int32_t value)> remember = {};
   ProgressModel progress;
   uint32_t writeAborts = 0;   // files left out because no numbered variant was free
@@ -99,7 +99,7 @@ struct FileOutcome {
   bool skipped = false;   // left out by choice or for want of a name; not a failure
   bool replaced = false;  // the output took the place of a file
   std::string output = {};  // which of several outputs of its source, by name
-  std::string note = {};  // a remark that is no failure; empty when there is none
+  RecordedText note = {};   // a remark that is not a failure; empty if there is none
 };
 
 }  // namespace fotomill

@@ -3,6 +3,7 @@
 #include "picture/picture_record.h"
 #include "registry/registry.h"
 #include "registry/signature.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -13,17 +14,17 @@ std::string_view LooksLike(const std::string& fileName, int32_t formatIndex) {
 }
 
 std::string OpenHint(const std::string& fileName, Status status) {
-  if (fileName.size() > PathText::Capacity()) return "The path is longer than 260 characters.";
+  if (fileName.size() > PathText::Capacity()) return Tr("The path is longer than 260 characters.");
   if (status != Status::DamagedFile && status != Status::FileReadError && status != Status::UnsupportedFunction &&
       status != Status::UnsupportedFormat) {
     return {};
   }
   const int32_t index = FindFormatByName(fileName);
   if (const std::string_view name = LooksLike(fileName, index); !name.empty()) {
-    return "It looks like " + std::string(name) + ".";
+    return Tr("It looks like %1.", Tr(name));
   }
-  if (index == kNoFormat) return "No format goes by that extension.";
-  return std::string(CanRead(FormatRow(index)) ? std::string_view() : WhyNot(FormatRow(index)));
+  if (index == kNoFormat) return Tr("Unknown file extension.");
+  return CanRead(FormatRow(index)) ? std::string() : Tr(WhyNot(FormatRow(index)));
 }
 
 }  // namespace fotomill

@@ -1,6 +1,7 @@
 #include "batch/progress_box.h"
 
 #include "batch/job.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -12,7 +13,7 @@ void AddLine(BatchJob& job, ProgressLine line, const FileOutcome* outcome) {
 }
 
 void ShowPlace(BatchJob& job, uint32_t index, uint32_t count) {
-  SetStatus(job, "Processing file " + std::to_string(index + 1) + " of " + std::to_string(count));
+  SetStatus(job, Tr("Processing file %1 of %2", index + 1, count));
   if (job.box != nullptr) job.box->ShowProgress(index + 1, count);
 }
 
@@ -57,7 +58,7 @@ void FinishProgress(BatchJob& job) {
 std::string FileLine(const FileOutcome& outcome) {
   if (outcome.status == Status::Ok && !outcome.skipped) return outcome.source + " -> " + outcome.destination;
   std::string line = outcome.source + ": ";
-  line += outcome.skipped ? std::string_view() : StatusMessage(outcome.status);
+  if (!outcome.skipped) line += Tr(StatusMessage(outcome.status));
   if (!outcome.hint.empty()) line += (outcome.skipped ? "" : " ") + outcome.hint;
   return line;
 }

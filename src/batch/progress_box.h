@@ -11,26 +11,26 @@ namespace fotomill {
 struct BatchJob;
 struct FileOutcome;
 
-// Where a batch reports to. Faces implement it; every call comes from the thread that called the batch, which goes on when
-// the call returns: a window takes what it needs with it to its own thread. What is handed over is valid during the call.
+// Receives the reports of a batch. Front ends implement it. Every call comes from the thread that runs the batch, which waits for
+// it to return: a window copies what it needs to its own thread. Arguments are valid during the call.
 class ProgressBox {
  public:
   virtual ~ProgressBox() = default;
-  // A batch begins; the model is empty. False when there can be no box; the batch is not begun then.
+  // A batch starts; the model is empty. False if there can be no box; the batch is then not started.
   virtual bool Open(const ProgressModel& model) = 0;
   // A new last line of the list; `outcome` is null for lines that are not about a file.
   virtual void ShowLine(const ProgressLine& line, const FileOutcome* outcome) = 0;
   virtual void ShowStatus(const std::string& status) = 0;
-  // `done` of `count` files are dealt with.
+  // `done` of `count` files are finished.
   virtual void ShowProgress(uint32_t done, uint32_t count) { (void)done, (void)count; }
-  // The batch waits for a file, several times a second: time to redraw what tells the time.
+  // Called several times a second while the batch waits, to redraw times.
   virtual void Tick() {}
   // False ends the batch as Abort does, for a box that can report no more.
   virtual bool GoesOn() { return true; }
-  // The batch has ended and the box stays open to be read: the list is made anew with a vertical scroll bar, every line with
+  // The batch has ended and the box stays open: the list is rebuilt with a vertical scroll bar, every line with
   // its item and row height, the first visible line as before and the last one selected; Close is live, Abort is not.
   virtual void StayOpen(const ProgressModel& model) = 0;
-  // The batch has ended and the box goes.
+  // The batch has ended and the box closes.
   virtual void Close(const ProgressModel& model) = 0;
 };
 
@@ -39,13 +39,13 @@ class ProgressBox {
 bool OpenProgressBox(BatchJob& job);
 // Adds `text` as a new line and sets the status line to "Processing file %d of %d" with index + 1 and count.
 void ReportFile(BatchJob& job, std::string_view text, uint32_t index, uint32_t count);
-// The same with what became of the file. The text is FileLine(outcome); a failure sets the job's error flag.
+// The same with the outcome of the file. The text is FileLine(outcome); a failure sets the job's error flag.
 void ReportOutcome(BatchJob& job, const FileOutcome& outcome, uint32_t index, uint32_t count);
 void SetStatus(BatchJob& job, std::string_view text);
 // Adds the closing lines and closes the box or leaves it open for reading, as CloseProgressWhenDone says.
 void FinishProgress(BatchJob& job);
 
-// A file as the list shows it: "SOURCE -> DESTINATION", or "SOURCE: MESSAGE" with the hint behind it.
+// A line of the list: "SOURCE -> DESTINATION", or "SOURCE: MESSAGE" followed by the hint.
 std::string FileLine(const FileOutcome& outcome);
 
 }  // namespace fotomill

@@ -1,5 +1,7 @@
 #include "batch/progress_model.h"
 
+#include "texts/texts.h"
+
 namespace fotomill {
 
 namespace {
@@ -23,7 +25,7 @@ void ProgressModel::AddLine(ProgressLine line) {
 }
 
 void ProgressModel::Finish(bool errors, bool summary, const ProgressSettings& box) {
-  if (errors) AddLine({std::string(kErrorsLine), {}});
+  if (errors) AddLine({Tr(kErrorsLine), {}});
   if (summary) {
     AddLine({CountLine(files_), {}});
     selected_ = static_cast<int32_t>(lines_.size()) - 1;
@@ -34,9 +36,7 @@ void ProgressModel::Finish(bool errors, bool summary, const ProgressSettings& bo
 }
 
 std::string CountLine(uint32_t files) {
-  if (files == 0) return "No files were processed.";
-  if (files == 1) return "One file was processed.";
-  return std::to_string(files) + " files were processed.";
+  return files == 0 ? Tr("No files were processed.") : TrCount("One file was processed.", "%1 files were processed.", files);
 }
 
 Rectangle ProgressBoxPlace(int32_t frameWidth, int32_t frameHeight, const ProgressSettings& box) {

@@ -7,10 +7,11 @@
 
 #include "core/status.h"
 #include "picture/rectangle.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
-// Everything that a progress box shows and how it lies in its window, without a window.
+// Everything that a progress box shows and how it is in its window, without a window.
 
 // What each line of the list carries beside its text.
 struct ProgressItem {
@@ -72,7 +73,7 @@ class ProgressModel {
 };
 
 // The closing line of a batch in which a file failed.
-inline constexpr std::string_view kErrorsLine = "There were errors";
+inline constexpr std::string_view kErrorsLine = TrLater("There were errors");
 // "No files were processed.", "One file was processed." or "7 files were processed."
 std::string CountLine(uint32_t files);
 
@@ -86,7 +87,7 @@ enum class ProgressListKind {
   VariableRows,  // drawn by the box, each row as high as it needs
 };
 
-// Where the controls lie in a box of a client size; the same again whenever the size changes.
+// Where the controls are in a box of a client size; the same again whenever the size changes.
 struct ProgressLayout {
   Rectangle list, status, abort, close;
   ProgressListKind kind = ProgressListKind::Plain;

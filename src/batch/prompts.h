@@ -5,22 +5,23 @@
 #include <string_view>
 
 #include "picture/picture_record.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
 // The texts of the overwrite prompt.
-inline constexpr std::string_view kOverwriteTitle = "Overwrite File";
+inline constexpr std::string_view kOverwriteTitle = TrLater("Overwrite File");
 inline constexpr std::string_view kOverwriteText =
-    "Click on OK to overwrite the existing file.\nChange the file name and click on Ok for a new name.\n"
-    "Click on Cancel to skip this file.";
+    TrLater("Click on OK to overwrite the existing file.\nChange the file name and click on Ok for a new name.\n"
+            "Click on Cancel to skip this file.");
 inline constexpr std::string_view kOverwriteHelpPage = "OVERWRITE";
-inline constexpr std::string_view kNotifyText = "Notify me the next time I'm about to overwrite a file";
+inline constexpr std::string_view kNotifyText = TrLater("Notify me the next time I'm about to overwrite a file");
 inline constexpr std::string_view kNotifyNote =
-    "Note: if you disable this option, it can be re-enabled later in the Setup window.";
-inline constexpr std::string_view kKeepBothText = "Keep both files";
-inline constexpr std::string_view kApplyToRestText = "Apply to rest of batch";
-inline constexpr std::string_view kRecycleText = "Move ovewritten files to recycle bin";
-inline constexpr std::string_view kPreviewsText = "Show previews";
+    TrLater("Note: if you disable this option, it can be re-enabled later in the Setup window.");
+inline constexpr std::string_view kKeepBothText = TrLater("Keep both files");
+inline constexpr std::string_view kApplyToRestText = TrLater("Apply to rest of batch");
+inline constexpr std::string_view kRecycleText = TrLater("Move ovewritten files to recycle bin");
+inline constexpr std::string_view kPreviewsText = TrLater("Show previews");
 
 // The five check boxes of the overwrite prompt.
 struct OverwriteChecks {
@@ -38,7 +39,7 @@ struct OverwriteQuestion {
   std::string path;                        // the output, which exists
   std::string name;                        // its base name, for the File name field
   OverwriteChecks checks;                  // as they stand
-  const PictureRecord* picture = nullptr;  // the new picture, for its preview; null when there is none. Valid during the call
+  const PictureRecord* picture = nullptr;  // the new picture, for its preview; null if there is none. Valid during the call
   std::string problem;                     // why the last answer could not be taken, a sentence; empty at first
 };
 

@@ -4,6 +4,7 @@
 
 #include "operations/engine.h"
 #include "platform/files.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -36,7 +37,7 @@ std::string ReadFormat(const SaveStep& save, const BatchJob& job, const FormatLo
   }
   const std::string& format = job.formatIndex != kNoFormat ? job.extension : output.extension;
   const bool lossy = format.empty() || HasQuality(format);
-  if (save.mostBytes > 0 && !lossy) return "max-bytes needs a format with a quality, such as jpg or webp; not " + format + ".";
+  if (save.mostBytes > 0 && !lossy) return Tr("max-bytes needs a format with a quality, such as jpg or webp; not %1.", format);
   return {};
 }
 

@@ -29,7 +29,7 @@ class ReportedRun {
 
   ReportedRun(std::span<const BatchFile> files, BatchJob& job, Way way);
 
-  // At most `jobs` files at a time; 0: one a core.
+  // At most `jobs` files at a time; 0: one per core.
   void Run(uint32_t jobs) { run_.Run(files_.size(), jobs == 0 ? CoreJobs() : jobs); }
   // As OrderedRun::InTurn.
   bool InTurn(size_t file, const std::function<void()>& step) { return run_.InTurn(file, step); }

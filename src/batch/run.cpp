@@ -19,14 +19,15 @@
 #include "platform/volumes.h"
 #include "processing/palette/reduce.h"
 #include "registry/registry.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
 namespace {
 
 constexpr int kMostLostRaces = 100;
-constexpr const char* kNoName = "Its name would be empty or lead to another folder.";
-constexpr const char* kTooLong = "Its path would be longer than 260 characters.";
+constexpr const char* kNoName = TrLater("The name would be empty or contain a folder.");
+constexpr const char* kTooLong = TrLater("The path would be longer than 260 characters.");
 
 std::string FolderOf(const std::string& path) {
   const platform::PathParts parts = platform::SplitPath(path);
@@ -185,9 +186,9 @@ class Batch {
     if (destination.noVariant) {
       outcome.status = Status::ErrorCreatingFile;
       outcome.destination.clear();
-      outcome.hint = kWriteAborted;
+      outcome.hint = Tr(kWriteAborted);
     } else {
-      outcome.hint = destination.taken ? "skipped, " + destination.path + " exists." : "skipped.";
+      outcome.hint = destination.taken ? Tr("skipped: %1 exists.", destination.path) : Tr("skipped.");
     }
     return outcome;
   }
@@ -217,7 +218,7 @@ class Batch {
     if (picture == nullptr || status != Status::NoImages || function_.page <= picture->pageCount) {
       return OpenHint(name, status);
     }
-    return picture->pageCount == 1 ? "It has one page." : "It has " + std::to_string(picture->pageCount) + " pages.";
+    return TrCount("The file has only one page.", "The file has only %1 pages.", static_cast<uint64_t>(picture->pageCount));
   }
 
   // The function's own work, then the depth that the format takes.
@@ -253,7 +254,7 @@ class Batch {
           status == Status::ErrorCreatingFile && !destination.replace && platform::IsRegularFile(destination.path);
       if (!lostRace) return Failure(file, status, hint.empty() ? WriteHint(destination, status, picture, target) : hint);
     }
-    return Failure(file, Status::ErrorCreatingFile, std::string(kWriteAborted));
+    return Failure(file, Status::ErrorCreatingFile, Tr(kWriteAborted));
   }
 
   void GiveBack(const std::string& path) {
@@ -275,7 +276,7 @@ class Batch {
   }
 
   // Settles a name without waiting for the files before, where they cannot matter and nobody has to be asked. False when it
-  // cannot be done; the destination is as it was then.
+  // cannot be done; the destination is then unchanged.
   bool SettleAtOnce(const std::string& source, Destination& destination, DestinationAnswer& answer) {
     const std::lock_guard lock(mutex_);
     if (asksEveryName_ || !IsIndependent(source, destination.path)) return false;
@@ -301,7 +302,7 @@ class Batch {
     return true;
   }
 
-  // The same when every file before this one is done.
+  // As SettleAtOnce, but in turn: all earlier files are finished.
   DestinationAnswer SettleInTurn(const std::string& source, Destination& destination, const PictureRecord& picture,
                                  bool& cancelled) {
     cancelled = job_.stop.Token().Asked();
@@ -383,28 +384,28 @@ class Batch {
     const Status status = FindQuality(target.output->mostBytes, trial, best, smallest);
     if (status == Status::Ok) write.encode.SetQuality(best);
     picture.fileName = source;
-    if (status == Status::UnsuitableImage) hint = "At the lowest quality it has " + WithThousands(smallest) + " bytes.";
+    if (status == Status::UnsuitableImage) hint = Tr("At the lowest quality it has %1 bytes.", ThousandsText(smallest));
     return status;
   }
 
   FileOutcome Written(const BatchFile& file, const Destination& destination, bool replaces, const PictureRecord& picture) const {
     if (function_.keepTimes && !function_.dryRun && !platform::CopyTimes(file.name, destination.path)) {
-      FileOutcome outcome = Failure(file, Status::ErrorWritingFile, "The output was written, but its time could not be set.");
+      FileOutcome outcome = Failure(file, Status::ErrorWritingFile, Tr("The output was written, but its time could not be set."));
       outcome.destination = destination.path;
       return outcome;
     }
     return {.source = file.name, .destination = destination.path, .replaced = replaces, .note = LostMetadata(picture, destination)};
   }
 
-  // Metadata that the format cannot hold are not lost in silence, for who wants to know.
-  std::string LostMetadata(const PictureRecord& picture, const Destination& destination) const {
+  // Names the metadata the format could not store; shown by --verbose.
+  RecordedText LostMetadata(const PictureRecord& picture, const Destination& destination) const {
     const PictureMetadata& metadata = picture.metadata;
     std::string lost;
     if (!metadata.exif.empty() && (picture.lostMetadata & kLostExif) != 0) lost += ", EXIF";
     if (!metadata.xmp.empty() && (picture.lostMetadata & kLostXmp) != 0) lost += ", XMP";
     if (!metadata.icc.empty() && (picture.lostMetadata & kLostIcc) != 0) lost += ", color profile";
     if (!function_.keepMetadata || lost.empty()) return {};
-    return UpperCase(destination.extension) + " cannot hold its " + lost.substr(2) + ".";
+    return TrRecorded("%1 cannot store: %2.", UpperCase(destination.extension), lost.substr(2));
   }
 
   std::string WriteHint(const Destination& destination, Status status, const PictureRecord& picture, const OutputTarget& target) const {
@@ -412,12 +413,12 @@ class Batch {
     const std::string& path = destination.path;
     const std::string folder = FolderOf(path);
     const bool full = status == Status::ErrorWritingFile && platform::FreeSpace(folder) < picture.image.Bytes().size();
-    if (full) return "There is hardly room left where it goes.";
+    if (full) return Tr("Not enough disk space at the destination.");
     if (status != Status::ErrorCreatingFile) return {};
-    if (platform::IsFolder(path)) return "\"" + path + "\" is a folder.";
-    if (!folder.empty() && !platform::IsFolder(folder)) return "There is no folder \"" + folder + "\".";
-    if (destination.recycle && !platform::HasTrash(path)) return "\"" + path + "\" has no recycle bin to go to.";
-    return "\"" + path + "\" cannot be made.";
+    if (platform::IsFolder(path)) return Tr("\"%1\" is a folder.", path);
+    if (!folder.empty() && !platform::IsFolder(folder)) return Tr("The folder \"%1\" does not exist.", folder);
+    if (destination.recycle && !platform::HasTrash(path)) return Tr("There is no recycle bin for \"%1\".", path);
+    return Tr("\"%1\" cannot be created.", path);
   }
 
   const std::span<const BatchFile> files_;

@@ -15,14 +15,14 @@ namespace fotomill {
 // One file of the selection.
 struct BatchFile {
   std::string name;
-  std::string below;           // folder beneath the one that was chosen, "" or "a/b": for outputs that keep the tree
+  std::string below;           // subfolder below the chosen folder, "" or "a/b": for outputs that keep the tree
   Status status = Status::Ok;  // what is known to be wrong with it already; it is reported and not opened
   std::string hint;            // what goes behind the message of such a failure
 };
 
 // What a function does to every file of its selection.
 struct BatchFunction {
-  // Works on the decoded picture; empty when it is only converted. Called on several threads at once, on a picture each.
+  // Changes the decoded picture; empty for plain conversion. Called on several threads at once, with different pictures.
   std::function<Status(PictureRecord& picture)> transform = {};
   std::vector<BatchOutput> outputs = {};         // each file is decoded once for all of them; none: one, as the job says
   FallbackFormat fallback = {};                  // for jobs without a format: of sources whose own cannot be written
@@ -31,23 +31,23 @@ struct BatchFunction {
                                                  // but nothing in front of names that an output makes itself
   std::string out = {};                          // not empty: the whole path of the output of a selection of one
   int32_t page = 1;                              // of files with several, from 1
-  uint32_t jobs = 0;                             // pictures in work at a time; 0: one a core
+  uint32_t jobs = 0;                             // number of parallel jobs; 0: one per core
   bool reduce = false;                           // colors of pictures that are too deep for the format are reduced, as
                                                  // they always are for a format that was kept
-  std::string reduceHint = {};                   // goes behind "Too many colors." where they are not
-  bool autoOrient = false;                       // pictures are turned upright as their EXIF says
-  bool keepMetadata = true;                      // EXIF, XMP and color profiles go along
-  bool keepTimes = false;                        // outputs get the times of their sources
-  bool keepTree = false;                         // folders of the selection are made again in the destination folder
+  std::string reduceHint = {};                   // follows "Too many colors."
+  bool autoOrient = false;                       // pictures are rotated upright by EXIF orientation
+  bool keepMetadata = true;                      // EXIF, XMP and color profiles are copied
+  bool keepTimes = false;                        // outputs get the modification times of their sources
+  bool keepTree = false;                         // the folders of the selection are recreated in the destination folder
   bool dryRun = false;                           // nothing is written; outcomes are those of a run, as far as they can be told
 };
 
-// Runs a function over a selection: opens the job's progress box, asks what has to be asked, converts, reports every file
-// in selection order, gathers what the file history shall know, and finishes the box. Decoding, transforming and encoding
-// go on on several threads; everything else happens on the calling thread in the order of the selection, so that outputs,
-// names, questions and lines are those of a run with one; only a name typed into a question may be refused for a later file
-// that has taken it meanwhile. After Abort nothing new is begun, and what is in work is finished
-// or leaves nothing behind. Ok, or FunctionCancelled when the user did not want it to begin.
+// Runs a function over a selection: opens the job's progress box, asks questions, converts, reports every file in selection
+// order, collects entries for the file history, and finishes the box. Decoding, transforming and encoding run on several
+// threads; everything else happens on the calling thread in the order of the selection, so that outputs, names, questions and
+// lines are the same as with one thread; only a name typed into a question may be refused because a later file already has it.
+// After Abort no more files are started, and current files are finished or leave nothing behind. Ok, or FunctionCancelled if
+// the user declined to start.
 Status RunBatch(std::span<const BatchFile> files, const BatchFunction& function, BatchJob& job);
 
 }  // namespace fotomill

@@ -10,8 +10,7 @@
 
 namespace fotomill {
 
-// The names that one run deals with: those of its sources, those it has given to outputs, and those of files that are there.
-// Not for two threads at a time.
+// The names of a run: its sources, its outputs, and existing files. Not thread-safe.
 class RunNames {
  public:
   RunNames();
@@ -20,7 +19,7 @@ class RunNames {
   void AddSource(const std::string& source);
   void AddPlanned(const std::string& planned);
 
-  // Whether no other file of the run is concerned when this one's output is given its planned name.
+  // Whether the planned name of this output affects no other file of the run.
   bool ConcernsNobodyElse(const std::string& source, const std::string& planned) const;
   // Whether a path is a source or a planned output of the run.
   bool IsExpected(const std::string& path) const;
@@ -28,7 +27,7 @@ class RunNames {
   // Whether the output of another file of the run may come to lie where this source is.
   bool IsOutputOfOthers(const std::string& source, std::span<const std::string> planned) const;
 
-  // Whether another file of the run has the path as its source, or has been given it for its output.
+  // Whether another file of the run has the path as its source or output.
   bool TakenByRun(const std::string& path, const std::string& source) const;
   // The same, or there is a file of that name.
   bool Taken(const std::string& path, const std::string& source) const;
@@ -51,7 +50,7 @@ class RunNames {
   std::unordered_map<std::string, uint32_t> sources_;  // how often each is there
   std::unordered_map<std::string, uint32_t> planned_;
   std::unordered_set<std::string> given_;
-  std::unordered_map<std::string, int64_t> variants_;  // the number to go on with, by the path without one
+  std::unordered_map<std::string, int64_t> variants_;  // the number to continue with, by the path without one
 };
 
 }  // namespace fotomill

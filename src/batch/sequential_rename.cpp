@@ -9,13 +9,14 @@
 #include "platform/clock.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
 namespace {
 
 constexpr double kStoreInterval = 1;  // seconds between two writes of the next number
-constexpr const char* kNotSafe = "It could not be noted for --undo.";
+constexpr const char* kNotSafe = TrLater("It could not be recorded for --undo.");
 
 // Has the job remember the number that the next run begins with: a few times a second at most, and at the end.
 class NextNumber {
@@ -53,8 +54,8 @@ std::string NewBaseName(const BatchJob& job, const SequentialRenameRules& rules,
 }
 
 std::string RenameHint(const std::string& path, const BatchJob& job) {
-  if (!IsPlainName(job.rename.baseName.view())) return "The base name is a part of a name and cannot lead to a folder.";
-  if (path.size() > PathText::Capacity()) return "Its path would be longer than 260 characters.";
+  if (!IsPlainName(job.rename.baseName.view())) return Tr("The base name must be part of a file name, not a path.");
+  if (path.size() > PathText::Capacity()) return Tr("The path would be longer than 260 characters.");
   return {};
 }
 
@@ -75,10 +76,10 @@ FileOutcome RenameOne(const BatchFile& file, const SequentialRenameRules& rules,
     outcome.hint = RenameHint(outcome.destination, job);
   } else if (outcome.destination == file.name) {
     outcome.skipped = true;
-    outcome.hint = "skipped, it cannot have its new name.";
+    outcome.hint = Tr("skipped: the new name is not available.");
   } else if (log != nullptr) {
     const bool noted = log->Add({platform::AbsolutePath(file.name), platform::AbsolutePath(outcome.destination)});
-    if (!noted) outcome.note = kNotSafe;
+    if (!noted) outcome.note = TrRecorded(kNotSafe);
   }
   return outcome;
 }
@@ -179,10 +180,10 @@ bool UndoRename(const std::set<std::string>& only, bool dryRun, BatchJob& job) {
     FileOutcome outcome{.source = file.to, .destination = file.from};
     if (!files.Exists(file.to)) {
       outcome.status = Status::FileOpenError;
-      outcome.hint = "There is no such file.";
+      outcome.hint = Tr("The file does not exist.");
     } else if (files.Exists(file.from) || files.Rename(file.to, file.from) != platform::CommitResult::Done) {
       outcome.status = Status::RenameError;
-      outcome.hint = files.Exists(file.from) ? "\"" + file.from + "\" exists." : "";
+      outcome.hint = files.Exists(file.from) ? Tr("\"%1\" exists.", file.from) : "";
     } else {
       job.uses.push_back(Use(file.to, true));
       job.uses.push_back(Use(file.from, false));

@@ -46,7 +46,7 @@ class RenamedFiles {
 std::string NumberText(uint32_t number, int32_t digits);
 
 // Gives `path` the next free number and stores the new path in it. Ok when the file was renamed or, the new name being
-// taken, left as it was; RenameError when no number was free within the attempts, or when the system does not rename it.
+// taken, left unchanged; RenameError when no number was free within the attempts, or when the system does not rename it.
 // A rename sets the job's files-changed flag and goes to job.uses.
 Status RenameSequentially(BatchJob& job, std::string& path, const SequentialRenameRules& rules, RenamedFiles& files);
 

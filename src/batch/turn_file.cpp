@@ -13,6 +13,7 @@
 #include "platform/temporary_file.h"
 #include "platform/unchanged_file.h"
 #include "registry/registry.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -45,16 +46,16 @@ bool LookTheSame(const PictureRecord& a, const PictureRecord& b) {
   return true;
 }
 
-// Why a picture cannot be written again as it is, before its pixels are looked at; empty when nothing speaks against it.
+// Why a picture cannot be rewritten unchanged, apart from its pixels; empty if it can.
 std::string Obstacle(const PictureRecord& picture) {
-  if (!CanWrite(FormatRow(picture.formatIndex))) return "Files of this format cannot be written.";
-  if (picture.pageCount > 1) return "It holds several pictures, of which only one would be left.";
-  if (picture.simplified) return "It holds more than would be written again.";
-  if (!picture.warning.empty()) return "It is damaged, though it can be shown.";
+  if (!CanWrite(FormatRow(picture.formatIndex))) return Tr("Files of this format cannot be written.");
+  if (picture.pageCount > 1) return Tr("The file has several pictures; all but one would be lost.");
+  if (picture.simplified) return Tr("The file has data that would be lost.");
+  if (!picture.warning.empty()) return Tr("The file is damaged, although it can be shown.");
   return {};
 }
 
-// One file on its way.
+// Turns one file.
 class Turning {
  public:
   Turning(const std::string& source, const std::string& destination, const TurnRequest& request, const ReadOptions& read,
@@ -81,7 +82,7 @@ class Turning {
     const auto time = request_.keepTime ? platform::ModificationTime(source_) : std::nullopt;
     RETURN_IF_BAD(FormatRow(picture->formatIndex).turnsWithoutLoss ? TurnAsJpeg() : TurnDecoded(std::move(picture)));
     if (!result_.changed || !time || platform::SetModificationTime(destination_, *time)) return Status::Ok;
-    return Fail(Status::ErrorWritingFile, "It was turned, but its time could not be set.");
+    return Fail(Status::ErrorWritingFile, Tr("The file was turned, but its time could not be set."));
   }
 
   Status TurnAsJpeg() {
@@ -92,13 +93,14 @@ class Turning {
     const JpegTurnWish wish{
         .turn = request_.turn, .seenByExif = request_.seenByExif, .trim = request_.trim, .encode = options_.encode};
     if (const Status status = MakeTurnedJpeg(file.Bytes(), wish, made, turned); status != Status::Ok) {
-      return Fail(status, turned.obstacle);
+      return Fail(status, turned.obstacle.shown);
     }
     if (!file.Intact()) return Status::FileReadError;
-    if (turned.way == JpegTurnWay::Trimmed) result_.note = "An edge was cut off.";
+    if (turned.way == JpegTurnWay::Trimmed) result_.note = TrRecorded("An edge was cropped.");
     if (!turned.obstacle.empty()) {
       const bool tag = turned.way == JpegTurnWay::Tag;
-      result_.note = (tag ? "Turned by its orientation alone. " : "It is left to its orientation. ") + turned.obstacle;
+      result_.note = tag ? TrRecorded("Only the EXIF orientation was changed.") : TrRecorded("Left unchanged.");
+      result_.note.Append(turned.obstacle);
     }
     return WriteUnlessThere(turned.way == JpegTurnWay::Nothing ? file.Bytes() : made, turned.way == JpegTurnWay::Nothing);
   }
@@ -118,7 +120,7 @@ class Turning {
     return WriteDecoded(*picture);
   }
 
-  // Writes a working file first: only what reads back as it was takes the old one's place.
+  // Writes a temporary file first; it replaces the old file only if it reads back identically.
   Status WriteDecoded(PictureRecord& picture) {
     platform::TemporaryFile working;
     if (!working.Create(std::string(".").append(platform::ExtensionOf(source_)))) return Status::ErrorCreatingFile;
@@ -132,27 +134,27 @@ class Turning {
     const PictureMetadata& metadata = picture.metadata;
     const bool kept = metadata.exif.empty() == back->metadata.exif.empty() && metadata.xmp == back->metadata.xmp &&
                       metadata.icc == back->metadata.icc;
-    if (!LookTheSame(picture, *back)) return Fail(Status::UnsuitableImage, "Its format would change its colors.");
-    if (!kept) return Fail(Status::UnsuitableImage, "Its EXIF, XMP or color profile would be lost.");
-    if (picture.comment != back->comment) return Fail(Status::UnsuitableImage, "Its comment would be lost.");
+    if (!LookTheSame(picture, *back)) return Fail(Status::UnsuitableImage, Tr("The format would change the colors."));
+    if (!kept) return Fail(Status::UnsuitableImage, Tr("EXIF, XMP or the color profile would be lost."));
+    if (picture.comment != back->comment) return Fail(Status::UnsuitableImage, Tr("The comment would be lost."));
     platform::FileView file;
     if (!file.Open(working.Path())) return Status::FileOpenError;
     return WriteUnlessThere(file.Bytes(), false);
   }
 
-  // What is the same already is copied, but not onto itself.
+  // An unchanged picture is copied, unless source and destination are the same.
   Status WriteUnlessThere(std::span<const uint8_t> bytes, bool same) {
     if (same && source_ == destination_) return Status::Ok;
     ByteWriter out;
-    if (!out.Create(destination_)) return Fail(Status::ErrorCreatingFile, "\"" + destination_ + "\" cannot be made.");
+    if (!out.Create(destination_)) return Fail(Status::ErrorCreatingFile, Tr("\"%1\" cannot be created.", destination_));
     out.Bytes(bytes);
     WriteOptions options = options_;
-    bool unchanged = true;  // what somebody else has written meanwhile stays
+    bool unchanged = true;  // a file that another program changed meanwhile is not replaced
     options.makeWay = [&] {
       return (!options_.makeWay || options_.makeWay()) && (unchanged = platform::IsUnchanged(source_, facts_));
     };
     const Status status = CommitOutput(out, options);
-    if (!unchanged) return Fail(Status::FileReadError, "It was changed meanwhile.");
+    if (!unchanged) return Fail(Status::FileReadError, Tr("The file was changed by another program."));
     RETURN_IF_BAD(status);
     result_.changed = true;
     return Status::Ok;

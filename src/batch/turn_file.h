@@ -6,29 +6,29 @@
 #include "picture/read_request.h"
 #include "picture/write_options.h"
 #include "processing/geometry/orient.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
 // How pictures are to be turned.
 struct TurnRequest {
   Orientation turn = Orientation::Upright;  // of the picture as it is seen
-  bool seenByExif = true;                   // it is seen as its EXIF orientation says
-  bool trim = false;                        // edges of JPEG pictures that cannot be turned without loss are cut off
+  bool seenByExif = true;                   // the EXIF orientation is applied first
+  bool trim = false;                        // JPEG edges that cannot be turned losslessly are cropped
   bool keepTime = false;                    // the new file has the time of the old one
 };
 
-// What became of one file.
+// The result for one file.
 struct TurnedFile {
   Status status = Status::Ok;
   std::string hint = {};  // to a failure, as a sentence
-  std::string note = {};  // how it was turned where that is not as usual
-  bool changed = false;   // false: nothing was written, the file is turned so already
+  RecordedText note = {};  // how it was turned if not as usual
+  bool changed = false;   // false: nothing was written, the orientation is already right
 };
 
-// Writes a turned copy of a picture file, or takes its place; `options` say what becomes of a file of the destination's name.
-// JPEG pictures turn without loss, or by their orientation alone. Others are decoded, turned and written in their own format,
-// but only where the new file then holds every pixel as it was: UnsuitableImage (13), with a hint, where it does not. Nothing is
-// written unless Ok.
+// Writes a turned copy of a picture file, or replaces it; `options` say what to do if the destination exists. JPEG pictures are
+// turned losslessly, or only their orientation is changed. Others are decoded, turned and written in their own format, but only if
+// the new file has every pixel unchanged: otherwise UnsuitableImage (13), with a hint. Nothing is written unless Ok.
 TurnedFile TurnPictureFile(const std::string& source, const std::string& destination, const TurnRequest& request,
                            const ReadOptions& read, const WriteOptions& options);
 

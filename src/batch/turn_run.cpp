@@ -9,6 +9,7 @@
 #include "batch/run_names.h"
 #include "platform/files.h"
 #include "platform/paths.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -56,7 +57,7 @@ class TurnBatch {
     if (file.status != Status::Ok) return Failure(file, file.status, file.hint);
     FileOutcome outcome{.source = file.name, .destination = Planned(file)};
     if (function_.inPlace && platform::FactsOf(file.name).link) {
-      return Failure(file, Status::ErrorCreatingFile, "It is a link; name the file that it leads to.");
+      return Failure(file, Status::ErrorCreatingFile, Tr("This is a link; name the file it points to."));
     }
     bool goesOn = true;
     if (names_.ConcernsNobodyElse(file.name, outcome.destination)) {
@@ -74,7 +75,7 @@ class TurnBatch {
     const std::string planned = outcome.destination;
     if (function_.inPlace) {
       outcome.skipped = names_.TakenByRun(planned, outcome.source);
-      if (outcome.skipped) outcome.hint = "is turned already; it is named twice.";
+      if (outcome.skipped) outcome.hint = Tr("listed twice; already turned.");
       outcome.replaced = true;
     } else if (names_.Taken(planned, outcome.source)) {
       SettleTaken(outcome);
@@ -91,11 +92,11 @@ class TurnBatch {
     outcome.replaced = false;
     outcome.skipped = job_.overwrite.skip;
     if (outcome.skipped) {
-      outcome.hint = "skipped, " + outcome.destination + " exists.";
+      outcome.hint = Tr("skipped: %1 exists.", outcome.destination);
     } else if (!names_.MakeVariant(outcome.destination, job_.naming.firstVariant, job_.naming.lastVariant, taken)) {
       outcome.skipped = true;
       outcome.status = Status::ErrorCreatingFile;
-      outcome.hint = kWriteAborted;
+      outcome.hint = Tr(kWriteAborted);
     }
   }
 
@@ -110,16 +111,16 @@ class TurnBatch {
     }
     TurnedFile turned;
     if (!folder.empty() && !platform::MakeFolders(folder)) {
-      turned = {.status = Status::ErrorCreatingFile, .hint = "There is no folder \"" + folder + "\"."};
+      turned = {.status = Status::ErrorCreatingFile, .hint = Tr("The folder \"%1\" does not exist.", folder)};
     } else {
       turned = TurnPictureFile(outcome.source, outcome.destination, function_.request, job_.read, options);
     }
     if (turned.changed && function_.inPlace && function_.replaced) function_.replaced(outcome.source);
     outcome.status = turned.status;
-    outcome.hint = kept ? turned.hint : std::string("There is no room to keep the old file for undo.");
+    outcome.hint = kept ? turned.hint : std::string(Tr("There is not enough disk space to keep the old file for undo."));
     outcome.note = turned.note;
     outcome.skipped = turned.status == Status::Ok && !turned.changed;
-    if (outcome.skipped) outcome.hint = turned.note.empty() ? "stands so already." : turned.note;
+    if (outcome.skipped) outcome.hint = turned.note.empty() ? Tr("already in this orientation.") : turned.note.shown;
     if (turned.status != Status::Ok) outcome.destination.clear();
   }
 

@@ -13,11 +13,11 @@ namespace fotomill {
 // What is done to every file of a selection that is turned.
 struct TurnFunction {
   TurnRequest request;
-  bool inPlace = false;   // each file is replaced; otherwise it goes into the job's destination folder under its own name
-  bool keepTree = false;  // folders of the selection are made again there
-  uint32_t jobs = 0;      // files in work at a time; 0: one a core
+  bool inPlace = false;   // each file is replaced; otherwise it is written to the job's destination folder under its own name
+  bool keepTree = false;  // the folders of the selection are recreated there
+  uint32_t jobs = 0;      // number of parallel jobs; 0: one per core
   bool dryRun = false;    // nothing is written
-  // Called on any thread before a file is replaced in its place; false: it stays, as it could not be kept for later.
+  // Called on any thread before a file is replaced in place; false: it is left alone, because no copy could be kept.
   std::function<bool(const std::string& path)> keepPrevious = {};
   std::function<void(const std::string& path)> replaced = {};  // called likewise as soon as that was done
 };

@@ -1,4 +1,4 @@
-// A JPEG file's segments: FF, a marker byte, a length of two bytes that counts itself, data. Any number of FF may stand in
+// A JPEG file's segments: FF, a marker byte, a length of two bytes that counts itself, data. Any number of FF may be in
 // front of a marker; markers 01 and D0 to D8 have neither length nor data.
 //
 //   E0 "JFIF\0" version (2 bytes), unit, resolutions across and down (2 bytes each), width and height of a thumbnail (1 byte

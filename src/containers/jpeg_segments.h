@@ -29,12 +29,12 @@ struct JpegHead {
   std::vector<JpegSegment> segments;
   size_t scan = 0;  // where the first scan begins
 
-  // What the first EXIF and XMP segments hold behind their headings; empty when there is none.
+  // What the first EXIF and XMP segments hold behind their headings; empty if there is none.
   std::span<const uint8_t> Exif() const;
   std::span<const uint8_t> Xmp() const;
-  // Whether EXIF goes on in further segments: then what it points to there must stay where it is.
+  // Whether EXIF continues in further segments: then what it points to there must stay where it is.
   bool HasSplitExif() const;
-  // Whether further pictures lie behind the first, with an index of their places (CIPA DC-007, "MPF").
+  // Whether further pictures are behind the first, with an index of their places (CIPA DC-007, "MPF").
   bool HasMorePictures() const;
 };
 // DamagedFile (2) when the file is none, FileReadError (3) when it ends before its first scan.

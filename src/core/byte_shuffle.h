@@ -1,7 +1,7 @@
 #pragma once
 
 // Sixteen bytes at a time on x86 processors that can pick bytes by a table of indices (SSSE3, in all since 2008).
-// Functions that use it are marked BYTE_SHUFFLE, stand between `#ifdef BYTE_SHUFFLE` lines, and run only where
+// Functions that use it are marked BYTE_SHUFFLE, are between `#ifdef BYTE_SHUFFLE` lines, and run only where
 // CanShuffleBytes() says so; a plain loop beside them does the same work everywhere.
 #if defined(__x86_64__) || defined(__i386__)
 #include <tmmintrin.h>

@@ -59,7 +59,7 @@ class ByteWriter {
 
   // Bytes written so far.
   uint64_t Position() const { return flushed_ + used_; }
-  // These overwrite bytes that lie before Position(): what lies in the file already is changed there, the rest in the buffer.
+  // These overwrite bytes that are before Position(): what is in the file already is changed there, the rest in the buffer.
   void Patch(uint64_t offset, std::span<const uint8_t> bytes) {
     if (offset < flushed_) {
       const auto inFile = bytes.first(static_cast<size_t>(std::min<uint64_t>(bytes.size(), flushed_ - offset)));

@@ -10,7 +10,7 @@ namespace choice {
 
 // JpegSubsample: how many pixels share one pair of color values.
 enum JpegSubsampling : int32_t { kSubsample444 = 0, kSubsample422 = 1, kSubsample420 = 2 };
-// JpegProcessor. The default, 2, lies beyond the list and therefore means the last entry.
+// JpegProcessor. The default, 2, is beyond the list and therefore means the last entry.
 enum JpegEngine : int32_t { kJpegStandard = 0, kJpegFastest = 1 };
 // TiffOptions: compression of the strips. CCITT (group 4) serves pictures of one bit; deeper ones get LZW instead.
 enum TiffCompression : int32_t {

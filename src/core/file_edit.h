@@ -11,7 +11,7 @@ enum class EditResult {
   Done,       // the file holds the new contents
   Unchanged,  // there was nothing to change
   NotRead,    // the file is there and cannot be read, so it was left alone
-  Failed,     // it cannot be locked or written; it is as it was
+  Failed,     // it cannot be locked or written; it is unchanged
 };
 
 // Changes a small text file that other processes may change at the same time: takes its lock ("PATH.lock", which goes

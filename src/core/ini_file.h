@@ -45,7 +45,7 @@ struct IniEdit {
 };
 
 // The text with changes made to one section; everything else stays byte for byte. A key that is there keeps its place, new
-// keys come to the end of the section, and the section to the end of the text when there is none. Lines get the line
+// keys come to the end of the section, and the section to the end of the text if there is none. Lines get the line
 // end that the text has. `edits` names no key twice.
 std::string EditIni(std::string_view text, std::string_view section, std::span<const IniEdit> edits);
 

@@ -10,7 +10,7 @@ namespace fotomill {
 
 namespace {
 
-constexpr size_t kLongestName = 64;  // longer texts are no slips of the hand, and the table below stays small
+constexpr size_t kLongestName = 64;  // longer texts are not typing errors, and the table below stays small
 
 // Number of characters to change, insert, delete or swap with their neighbour to turn `a` into `b`.
 size_t EditDistance(std::string_view a, std::string_view b) {
@@ -57,11 +57,6 @@ std::string_view NearestName(std::string_view typed, std::span<const std::string
 std::string_view NearestOfAll(std::string_view typed, std::span<const std::string_view> names) {
   const std::string_view nearest = NearestBelow(SIZE_MAX, typed.substr(0, kLongestName), names);
   return nearest.empty() && !names.empty() ? names.front() : nearest;
-}
-
-std::string NearestNameHint(std::string_view typed, std::span<const std::string_view> names) {
-  const std::string_view nearest = NearestName(typed, names);
-  return nearest.empty() ? std::string() : " Did you mean \"" + std::string(nearest) + "\"?";
 }
 
 }  // namespace fotomill

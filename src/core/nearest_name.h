@@ -10,10 +10,7 @@ namespace fotomill {
 // characters, case ignored, or one that begins with what was typed. Empty when none is close; the first of equals.
 std::string_view NearestName(std::string_view typed, std::span<const std::string_view> names);
 
-// The nearest by the same measure, however far it is; empty only when there are no names.
+// The nearest by the same measure, however far it is; empty only if there are no names.
 std::string_view NearestOfAll(std::string_view typed, std::span<const std::string_view> names);
-
-// " Did you mean "NAME"?" for messages about an unknown name, empty when none is close.
-std::string NearestNameHint(std::string_view typed, std::span<const std::string_view> names);
 
 }  // namespace fotomill

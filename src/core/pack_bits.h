@@ -6,7 +6,7 @@
 
 namespace fotomill {
 
-// PackBits, which Amiga IFF calls ByteRun1: a byte n below 128 stands before n + 1 bytes as they are, one above 128 before a
+// PackBits, which Amiga IFF calls ByteRun1: a byte n below 128 is before n + 1 bytes as they are, one above 128 before a
 // byte that is repeated 257 - n times, and 128 means nothing.
 // Source: Apple Computer, Macintosh Technical Note 1023, "Understanding PackBits" (1996).
 

@@ -9,7 +9,7 @@ namespace {
 
 uint8_t ByteAt(std::string_view text, size_t place) { return static_cast<uint8_t>(text[place]); }
 
-// Bytes of the well-formed UTF-8 character at the start of `text` (Unicode, table 3-7), 0 when there is none.
+// Bytes of the well-formed UTF-8 character at the start of `text` (Unicode, table 3-7), 0 if there is none.
 size_t CharacterLength(std::string_view text) {
   const uint8_t first = ByteAt(text, 0);
   if (first < 0x80) return 1;

@@ -10,7 +10,7 @@
 namespace fotomill {
 
 // The decimal number at the start of a text, which is taken off it; blanks before it and a sign are allowed. nullopt, and
-// the text as it was, when there is none or it does not fit.
+// the text as it was, if there is none or it does not fit.
 template <std::integral T = int32_t>
 std::optional<T> TakeNumber(std::string_view& text) {
   std::string_view rest = text.substr(std::min(text.find_first_not_of(" \t"), text.size()));

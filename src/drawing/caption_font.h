@@ -22,7 +22,7 @@ class CaptionFont {
 
   // Opens the font of a family ("Arial") so that its lines are `height` pixels high, from the top of the tallest letters to
   // the bottom of the deepest. Where the system has no such family, a plain sans serif takes its place, the one of the same
-  // widths first. ResourceError when there is no font at all.
+  // widths first. ResourceError if there is no font at all.
   Status Open(std::string_view family, int32_t height);
   // Pixels that a text is wide.
   int32_t WidthOf(std::string_view text);

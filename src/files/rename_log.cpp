@@ -19,7 +19,7 @@ std::string RecordOf(const RenamedFile& file) {
   return record;
 }
 
-// Takes a text up to its zero byte off; false when there is none.
+// Takes a text up to its zero byte off; false if there is none.
 bool TakeText(std::string_view& contents, std::string& text) {
   const size_t end = contents.find('\0');
   if (end == std::string_view::npos) return false;

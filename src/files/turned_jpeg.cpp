@@ -6,6 +6,7 @@
 #include "metadata/exif/exif_edit.h"
 #include "metadata/exif/exif_walk.h"
 #include "metadata/xmp/xmp_edit.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -64,9 +65,9 @@ class TurnedFile {
  private:
   Status TurnPixels(Orientation wanted, TurnedJpeg& turned) const {
     if (head_.HasMorePictures()) {
-      turned.obstacle = "It holds further pictures, which belong to it as it is.";
+      turned.obstacle = TrRecorded("The file has embedded pictures that depend on its orientation.");
     } else if (head_.HasSplitExif()) {
-      turned.obstacle = "Its EXIF block is too large for one segment.";
+      turned.obstacle = TrRecorded("The EXIF block is too large for one segment.");
     } else {
       return TurnJpeg(file_, wanted, wish_.trim, turned);
     }

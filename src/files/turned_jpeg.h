@@ -8,6 +8,7 @@
 #include "core/status.h"
 #include "picture/encode_options.h"
 #include "processing/geometry/orient.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -28,7 +29,7 @@ enum class JpegTurnWay {
 };
 struct JpegTurnResult {
   JpegTurnWay way = JpegTurnWay::Nothing;
-  std::string obstacle;  // why the pixels were not turned, as a sentence
+  RecordedText obstacle;  // why the pixels were not turned, as a sentence
 };
 
 // Makes the file of a turned JPEG picture; no pixel gets another value. Where the pixels cannot be turned, the orientation is set

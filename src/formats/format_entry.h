@@ -12,6 +12,7 @@
 #include "picture/picture_record.h"
 #include "picture/read_request.h"
 #include "picture/write_options.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -85,7 +86,7 @@ struct FormatLibrary {
 inline constexpr uint8_t kAllMetadata = kLostExif | kLostXmp | kLostIcc;
 
 // What a row says when its files can be read but not written.
-inline constexpr std::string_view kOnlyRead = "Files of this format can only be read.";
+inline constexpr std::string_view kOnlyRead = TrLater("Files of this format can only be read.");
 
 // One row of the registry: everything that the program knows about a format. A family of codecs has its rows in
 // formats/FAMILY/rows.cpp.

@@ -6,6 +6,7 @@
 #include <numbers>
 
 #include "core/text.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -65,6 +66,6 @@ double GpsDistance(double latitude1, double longitude1, double latitude2, double
   return radius * 2 * std::atan2(std::sqrt(part), std::sqrt(1 - part));
 }
 
-std::string_view DistanceUnitName(choice::DistanceUnit unit) { return unit == choice::kMiles ? "miles" : "kilometers"; }
+std::string_view DistanceUnitName(choice::DistanceUnit unit) { return unit == choice::kMiles ? TrLater("miles") : TrLater("kilometers"); }
 
 }  // namespace fotomill

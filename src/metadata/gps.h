@@ -28,7 +28,7 @@ double GpsDegrees(const GpsAngle& angle);
 // 3956) or kilometers (6367).
 // Source: R. W. Sinnott, "Virtues of the Haversine", Sky and Telescope 68/2 (1984).
 double GpsDistance(double latitude1, double longitude1, double latitude2, double longitude2, choice::DistanceUnit unit);
-// The name of a unit, "miles" or "kilometers".
+// The name of a unit in English, "miles" or "kilometers".
 std::string_view DistanceUnitName(choice::DistanceUnit unit);
 
 }  // namespace fotomill

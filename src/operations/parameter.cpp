@@ -7,8 +7,8 @@
 #include <cstdio>
 #include <optional>
 
-#include "core/nearest_name.h"
 #include "core/text.h"
+#include "texts/name_hint.h"
 
 namespace fotomill {
 

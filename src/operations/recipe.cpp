@@ -4,7 +4,7 @@
 #include <charconv>
 #include <cstdio>
 
-#include "core/nearest_name.h"
+#include "texts/name_hint.h"
 #include "core/plain_name.h"
 #include "core/text.h"
 #include "core/whole_number.h"

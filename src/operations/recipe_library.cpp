@@ -4,7 +4,7 @@
 
 #include "core/data_folder.h"
 #include "core/limits.h"
-#include "core/nearest_name.h"
+#include "texts/name_hint.h"
 #include "platform/files.h"
 #include "platform/paths.h"
 

@@ -32,7 +32,7 @@ inline constexpr int32_t kCellExtraWidth = 12, kCellExtraHeight = 21;
 Rectangle PageSize(const CatalogueLook& look);
 // The corner of cell `index`, counted row by row, and its picture's room.
 Rectangle CellPlace(const CatalogueLook& look, int32_t index);
-// Where a picture of a size lies in a cell: scaled by one percentage, centred in the room 2 pixels in from the corner.
+// Where a picture of a size is in a cell: scaled by one percentage, centred in the room 2 pixels in from the corner.
 Rectangle PicturePlace(const CatalogueLook& look, const Rectangle& cell, int32_t width, int32_t height);
 
 // Scales a picture to a cell's room: 24 bits, on the page's background. Statuses as ScaleFiltered.

@@ -18,6 +18,7 @@
 #include "platform/paths.h"
 #include "platform/process.h"
 #include "processing/palette/reduce.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -151,11 +152,11 @@ class ContactSheet {
         if (status == Status::FunctionCancelled) {
           outcome.status = noName ? Status::ErrorCreatingFile : Status::Ok;
           outcome.skipped = true;
-          outcome.hint = noName ? kWriteAborted : "skipped, with its page.";
+          outcome.hint = noName ? Tr(kWriteAborted) : Tr("skipped, like its page.");
           if (noName) outcome.destination.clear();
         }
         if (status == Status::TooManyColors) outcome.hint = options_.reduceHint;
-        if (status == Status::ErrorCreatingFile) outcome.hint = "\"" + path + "\" cannot be made.";
+        if (status == Status::ErrorCreatingFile) outcome.hint = Tr("\"%1\" cannot be created.", path);
       }
       ReportOutcome(job_, outcome, reported_++, static_cast<uint32_t>(files_.size()));
     }

@@ -34,7 +34,7 @@ struct ContactSheetOptions {
   std::string fontName = "Arial";  // of the names
   bool upright = true;             // pictures are turned as their EXIF says
   std::string reduceHint = {};  // goes behind "Too many colors."
-  uint32_t jobs = 0;            // pictures in work at a time; 0: one a core
+  uint32_t jobs = 0;            // pictures in progress at a time; 0: one per core
 };
 
 // Draws a selection on catalogue pages: opens the job's progress box, decodes and scales on several threads, draws and writes

@@ -47,7 +47,7 @@ std::optional<std::vector<FolderEntry>> ListFolder(const std::string& path);
 // Renames within one file system. A destination that is there and neither a regular file nor a link stays: Failed. Where
 // case does not count, a name may be changed to itself in other case.
 [[nodiscard]] CommitResult RenameFile(const std::string& from, const std::string& to, Existing existing);
-// Moves a file, folder or link into the system's trash, from which its user can bring it back. False when there is none
+// Moves a file, folder or link into the system's trash, from which its user can bring it back. False if there is none
 // for it; nothing has happened then.
 [[nodiscard]] bool MoveToTrash(const std::string& path);
 // Brings back what MoveToTrash took away from that path last. False when it is not in the trash any more, or when the path
@@ -78,7 +78,7 @@ std::optional<ExactTime> ModificationTime(const std::string& path);
 // could not read loses it. A link that leads nowhere has failed. `contents` is empty unless Done.
 enum class ReadResult { Done, Missing, Failed, TooLarge };
 ReadResult ReadWholeFile(const std::string& path, uint64_t most, std::string& contents);
-// Replaces a file's contents in one step, synced. False leaves the old file as it was.
+// Replaces a file's contents in one step, synced. False leaves the old file unchanged.
 [[nodiscard]] bool WriteWholeFile(const std::string& path, std::string_view contents);
 
 }  // namespace fotomill::platform

@@ -10,7 +10,7 @@ enum class SpecialFolder {
   ApplicationData,  // $XDG_CONFIG_HOME, else ~/.config; on Windows the roaming application data (CSIDL 26)
   Cache,            // $XDG_CACHE_HOME, else ~/.cache
   Home,
-  Pictures,   // as the user named it (user-dirs.dirs), else ~/Pictures where there is one, else the home folder
+  Pictures,   // as the user named it (user-dirs.dirs), else ~/Pictures if there is one, else the home folder
   Documents,  // likewise
   Temporary,  // $TMPDIR where it is a folder, else /tmp
 };

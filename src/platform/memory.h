@@ -25,9 +25,9 @@ class MemoryBlock {
   MemoryBlock& operator=(const MemoryBlock&) = delete;
   ~MemoryBlock() { Free(); }
 
-  // Replaces the block by one of `size` bytes. False, with the block empty, when there is no memory.
+  // Replaces the block by one of `size` bytes. False, with the block empty, if there is no memory.
   [[nodiscard]] bool Allocate(uint64_t size, Fill fill = Fill::Zero);
-  // Grows or shrinks, keeping the contents up to the smaller size; new bytes are zero. False leaves the block as it was.
+  // Grows or shrinks, keeping the contents up to the smaller size; new bytes are zero. False leaves the block unchanged.
   [[nodiscard]] bool Resize(uint64_t size);
   void Free();
 

@@ -5,7 +5,7 @@
 
 namespace fotomill::platform {
 
-// The program registered for a file, as an argument vector that opens it; empty when there is none.
+// The program registered for a file, as an argument vector that opens it; empty if there is none.
 std::vector<std::string> ProgramFor(const std::string& file);
 // Starts a program with its arguments, without a shell. A name without separator is looked up in the absolute folders of
 // PATH, never in the current one. `wait` blocks until it has ended; without it the program lives on its own, away from this
@@ -19,8 +19,10 @@ bool IsTerminal(int stream);  // 0 standard input, 1 output, 2 error
 bool IsStored(int stream);    // goes to a regular file: nobody waits for what is written
 // Waits until the standard input has something to read, or has ended. False when the program was asked to end meanwhile.
 bool WaitForInput();
-// Whether what is typed on the terminal of the standard input shows up there. False when there is no such terminal.
+// Whether what is typed on the terminal of the standard input shows up there. False if there is no such terminal.
 bool ShowTyping(bool show);
+// Gives an environment variable a value, for this program and those that it starts. Before other threads run.
+void SetVariable(const char* name, const std::string& value);
 int TerminalWidth();   // columns, 80 when unknown
 unsigned CoreCount();  // cores this process may use, at least 1
 

@@ -18,7 +18,7 @@ class ReservedMemory {
   ReservedMemory& operator=(ReservedMemory&& other) noexcept;
   ~ReservedMemory() { Free(); }
 
-  // Replaces the room by `size` zero bytes. False, with the room as it was, when there is no address space.
+  // Replaces the room by `size` zero bytes. False, with the room unchanged, if there is no address space.
   [[nodiscard]] bool Reserve(uint64_t size);
   void Free();
 

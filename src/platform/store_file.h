@@ -29,7 +29,7 @@ class StoreFile {
   // All or nothing: false when fewer bytes were read or written.
   [[nodiscard]] bool ReadAt(uint64_t offset, std::span<uint8_t> bytes) const;
   [[nodiscard]] bool WriteAt(uint64_t offset, std::span<const uint8_t> bytes);
-  // The same with bytes that lie in two places, one after the other in the file.
+  // The same with bytes that are in two places, one after the other in the file.
   [[nodiscard]] bool ReadAt(uint64_t offset, std::span<uint8_t> first, std::span<uint8_t> second) const;
   [[nodiscard]] bool WriteAt(uint64_t offset, std::span<const uint8_t> first, std::span<const uint8_t> second);
   [[nodiscard]] bool Sync();

@@ -31,7 +31,7 @@ class TemporaryFile {
     std::swap(path_, other.path_);
     std::swap(listed_, other.listed_);
   }
-  // Where the file is; empty when there is none. Delete may be called at any time.
+  // Where the file is; empty if there is none. Delete may be called at any time.
   const std::string& Path() const { return path_; }
   void Delete();
 

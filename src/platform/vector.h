@@ -1,6 +1,6 @@
 #pragma once
 
-// Functions for processors that have more than the build's baseline. What stands between VECTOR_AVX2_BEGIN and
+// Functions for processors that have more than the build's baseline. What is between VECTOR_AVX2_BEGIN and
 // VECTOR_AVX2_END is compiled for AVX2 where the build knows it (VECTOR_HAS_AVX2 is 1), and may be called when
 // HasAvx2() says so. Nothing that the baseline uses too, such as a header of the standard library, may be included there.
 

@@ -6,7 +6,7 @@
 
 namespace fotomill::platform {
 
-// What a volume lies on; Unknown where the system does not tell.
+// What a volume is on; Unknown where the system does not tell.
 enum class DriveKind { Unknown, Removable, Fixed, Network, Optical, Ram };
 
 // The volume that holds a path: its label and serial number as the system tells them.

@@ -15,7 +15,7 @@ class SharedBlock {
   SharedBlock(const SharedBlock&) = delete;
   SharedBlock& operator=(const SharedBlock&) = delete;
 
-  // False when there is no memory. Once for each block.
+  // False if there is no memory. Once for each block.
   [[nodiscard]] bool Allocate(uint64_t size);
   std::span<uint8_t> Bytes() { return {data_, static_cast<size_t>(size_)}; }
   std::span<const uint8_t> Bytes() const { return {data_, static_cast<size_t>(size_)}; }

@@ -7,6 +7,7 @@
 
 #include "core/fixed_text.h"
 #include "plugins/fotomill_plugin.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -74,7 +75,7 @@ void EnablePlugins(const std::string& folder = {});
 
 // Calls a row's own settings dialog. False when the module offers none; the text to show then is kNothingToConfigure.
 bool ConfigurePlugin(int32_t index);
-inline constexpr std::string_view kNothingToConfigure = "No configuration items are available for the selected plugin.";
+inline constexpr std::string_view kNothingToConfigure = TrLater("No configuration items are available for the selected plugin.");
 // The help page of a module beneath the program's folder: "html\NAME", with the system's separator.
 std::string PluginHelpPage(int32_t index);
 

@@ -13,12 +13,12 @@ namespace fotomill {
 // The rows of an image of any depth as 24-bit pixels. The image must outlive the reader and keep its block.
 class BgrRows {
  public:
-  // MemoryAllocationError when there is no room for a row.
+  // MemoryAllocationError if there is no room for a row.
   Status Open(const PackedImage& image);
   // Row y from the top: blue, green, red of each pixel; a view of the image itself when that has 24 bits, else a row of
   // this reader, which the next call overwrites.
   const uint8_t* Row(int32_t y);
-  // The same into `bgr`, three bytes a pixel.
+  // The same into `bgr`, three bytes per pixel.
   void CopyRow(int32_t y, uint8_t* bgr) const;
 
  private:

@@ -131,7 +131,7 @@ FormatEntry RowWithoutCodec(const Place& place) {
   row.description = place.description;
   row.enabled = place.enabled;
   row.flags = place.flags;
-  row.whyNot = place.unpublished ? "The format was never published." : "This build has no codec for the format.";
+  row.whyNot = place.unpublished ? TrLater("The format was never published.") : TrLater("This build has no codec for the format.");
   return row;
 }
 
@@ -141,6 +141,7 @@ std::vector<std::span<const FormatEntry>> FormatFamilies() {
   return {
 #define FAMILY(name) name##Rows(),
 #include "formats/families.def"
+#include "texts/texts.h"
 #undef FAMILY
   };
 }

@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "formats/format_entry.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -20,6 +21,6 @@ std::vector<std::span<const FormatEntry>> FormatFamilies();
 FormatTable MakeFormatTable();
 
 // The row that waits for a plug-in's format.
-constexpr FormatEntry SpareRow() { return {.flags = FMT_SPARE, .whyNot = "No plug-in uses this row."}; }
+constexpr FormatEntry SpareRow() { return {.flags = FMT_SPARE, .whyNot = TrLater("No plug-in uses this row.")}; }
 
 }  // namespace fotomill

@@ -5,6 +5,7 @@
 
 #include "core/text.h"
 #include "platform/paths.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 

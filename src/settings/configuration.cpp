@@ -9,6 +9,7 @@
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -118,7 +119,7 @@ SetResult SetSetting(std::string_view key, std::string_view value) {
   const KeyRow* const row = FindKey(key);
   if (row == nullptr) {
     return {SetResult::UnknownKey,
-            "There is no key \"" + std::string(key) + "\"; the nearest is " + std::string(NearestKey(key)) + "."};
+            Tr("Unknown key \"%1\"; the nearest is %2.", key, NearestKey(key))};
   }
   const SettingValue read = ReadValue(*row, value, ValueSource::Person);
   if (!read.usable) return {SetResult::WrongValue, FaultMessage(*row, read.fault)};
@@ -131,9 +132,9 @@ std::string_view SaveMessage(SaveResult result) {
   switch (result) {
     case SaveResult::Done:
     case SaveResult::Unchanged: return {};
-    case SaveResult::NoFolder: return "There is no folder for the configuration file.";
-    case SaveResult::Unreadable: return "The configuration file is there but cannot be read, so it was left as it is.";
-    case SaveResult::Failed: return "The configuration file could not be written.";
+    case SaveResult::NoFolder: return TrLater("There is no folder for the configuration file.");
+    case SaveResult::Unreadable: return TrLater("The configuration file cannot be read; left unchanged.");
+    case SaveResult::Failed: return TrLater("The configuration file could not be written.");
   }
   return {};
 }

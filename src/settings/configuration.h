@@ -33,7 +33,7 @@ enum class ConfigurationState {
                // is written in this run
 };
 
-// A line of the configuration file that was not taken as it stands.
+// A line of the configuration file whose value was ignored or changed.
 struct ValueComplaint {
   const KeyRow* row;
   ValueFault fault;
@@ -50,7 +50,7 @@ std::span<const ValueComplaint> ConfigurationComplaints();
 // What became of a value given by name.
 struct SetResult {
   enum Code { Done, UnknownKey, WrongValue } code = Done;
-  std::string message;  // for people, a whole sentence; names the nearest key when there is none of that name
+  std::string message;  // in the user's language, a whole sentence; for an unknown key it names the nearest one
 
   // Whether there was nothing to complain of.
   bool Ok() const { return code == Done; }
@@ -67,12 +67,12 @@ enum class SaveResult {
   Unreadable,  // what is there cannot be read and is left alone
   Failed,      // not written; the old file stands
 };
-std::string_view SaveMessage(SaveResult result);  // a whole sentence, empty for success
+std::string_view SaveMessage(SaveResult result);  // a whole sentence in English, empty for success
 
 // Writes the keys that this run has changed since the load, and only those: what other processes wrote meanwhile, unknown
 // keys, comments and other sections stay. The file is replaced in one step.
 SaveResult SaveConfiguration();
-// Gives a key a value for good: takes it up and writes it, whatever --set said. `result` tells what is wrong with the value;
+// Gives a key a value permanently: takes it up and writes it, whatever --set said. `result` tells what is wrong with the value;
 // then nothing is written, and the key keeps its value if writing fails.
 SaveResult StoreSetting(const KeyRow& row, const SettingValue& value);
 // Takes a key out of the configuration file and gives it its default.

@@ -20,7 +20,7 @@ struct BrowserModes {
 BrowserModes ModesForFolder(const std::string& folder, const BrowserModes& current);
 
 // The same for the text of such a file: the keys ThumbnailMode, ViewMode and SortMode of the section "Fotomill". A value that
-// is no number, or a mode that there is not, sets nothing.
+// is no number, or an unknown mode, sets nothing.
 BrowserModes ModesInOverride(std::string_view text, const BrowserModes& current);
 
 }  // namespace fotomill

@@ -7,7 +7,7 @@
 
 namespace fotomill {
 
-// Lists of what was used last, the latest first: text files in the data folder, one entry a line. A key tells how long each
+// Lists of recently used items, the latest first: text files in the data folder, one entry per line. A key tells how long each
 // may get. Changes are merged with those of other processes and written in one step.
 
 // The entry, and the value of several text keys, that stands for the built-in choice.
@@ -23,10 +23,10 @@ enum class HistoryList {
   RenameBases,    // "FMWRenameHistory.txt", EditListMaximum: base names of sequential renaming
 };
 
-// The entries that may be offered. Empty when there is no list or it cannot be read.
+// The entries that may be offered. Empty if there is no list or it cannot be read.
 std::vector<std::string> LoadHistoryList(HistoryList list);
-// Puts an entry first, once. False when it cannot stand on a line (it is empty, over 260 bytes or holds a line break or zero
-// byte) or the list cannot be written; the list is as it was then.
+// Puts an entry first, once. False when it cannot be on a line (it is empty, over 260 bytes or holds a line break or zero
+// byte) or the list cannot be written; the list is then unchanged.
 [[nodiscard]] bool AddToHistoryList(HistoryList list, std::string_view entry);
 // Takes an entry out; true as well when it was not there.
 [[nodiscard]] bool RemoveFromHistoryList(HistoryList list, std::string_view entry);
@@ -39,7 +39,7 @@ struct RecentFile {
 
   bool operator==(const RecentFile&) const = default;
 };
-// The entries that may be offered, the latest first. Empty when there are none or the file cannot
+// The entries that may be offered, the latest first. Empty if there are none or the file cannot
 // be read.
 std::vector<RecentFile> LoadRecentFiles();
 // As for the lists above; the path decides what is the same entry.

@@ -38,7 +38,7 @@ union KeyExtra {
 // system's pointers elsewhere.
 struct KeyRow {
   const char* name;
-  void* variable;    // int32_t, or the characters of a text; lies in `settings`
+  void* variable;    // int32_t, or the characters of a text; is in `settings`
   uint32_t type;     // KeyType bits
   uint32_t control;  // number of the Setup control, 0 for none
   KeyExtra extra;
@@ -69,8 +69,8 @@ inline const KeyRow& KeyOf(KeyNumber number) { return keyTable.rows[static_cast<
 // The place of a row, or of the row that this one is a copy of.
 size_t NumberOfKey(const KeyRow& row);
 
-// The row of that very name, null when there is none. The table has no order to search by. `from` is the row where the
-// search begins; it goes on at the top, so that keys in table order are found at once.
+// The row of that very name, null if there is none. The table has no order to search by. `from` is the row where the
+// search begins; it continues at the top, so that keys in table order are found at once.
 const KeyRow* FindKey(std::string_view name, size_t from = 0);
 // The row whose Setup control has that number, null when none has.
 const KeyRow* FindKeyOfControl(uint32_t control);

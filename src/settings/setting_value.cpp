@@ -6,6 +6,7 @@
 #include "core/plain_name.h"
 #include "core/whole_number.h"
 #include "settings/spin_range.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -91,7 +92,7 @@ std::string ListText(const KeyRow& row) {
   int32_t position = 0;
   for (const ChoiceEntry* entry = row.extra.choices; entry->text != nullptr; ++entry, ++position) {
     const int32_t number = (row.type & KEY_BY_VALUE) != 0 ? entry->value : position;
-    text += (position == 0 ? "" : ", ") + std::to_string(number) + " (" + entry->text + ")";
+    text += (position == 0 ? "" : ", ") + std::to_string(number) + " (" + Tr(entry->text) + ")";
   }
   return text;
 }
@@ -129,22 +130,22 @@ std::string DefaultValueText(const KeyRow& row) {
 }
 
 std::string FaultMessage(const KeyRow& row, ValueFault fault) {
-  const std::string takes = std::string(row.name) + " takes ";
   switch (fault) {
     case ValueFault::None: return {};
-    case ValueFault::NotNumber: return takes + "a whole number.";
-    case ValueFault::NotFlag: return takes + (IsLooseFlag(row) ? "a whole number." : "0 or 1.");
-    case ValueFault::NotColor: return takes + "a color: blue * 65536 + green * 256 + red, or 0xBBGGRR.";
-    case ValueFault::NotChoice: return takes + ListText(row) + ".";
+    case ValueFault::NotNumber: return Tr("%1 takes a whole number.", row.name);
+    case ValueFault::NotFlag:
+      return IsLooseFlag(row) ? Tr("%1 takes a whole number.", row.name) : Tr("%1 takes 0 or 1.", row.name);
+    case ValueFault::NotColor: return Tr("%1 takes a color: blue * 65536 + green * 256 + red, or 0xBBGGRR.", row.name);
+    case ValueFault::NotChoice: return Tr("%1 takes %2.", row.name, ListText(row));
     case ValueFault::OutOfRange: {
       const SpinRange range = SpinRangeOf(row);
-      return takes + "a number from " + std::to_string(range.minimum) + " to " + std::to_string(range.maximum) + ".";
+      return Tr("%1 takes a number from %2 to %3.", row.name, range.minimum, range.maximum);
     }
-    case ValueFault::TooLong: return takes + "at most " + std::to_string(TextLimit(row)) + " characters.";
-    case ValueFault::NotText: return takes + "no line breaks and no zero bytes.";
+    case ValueFault::TooLong: return Tr("%1 takes at most %2 characters.", row.name, TextLimit(row));
+    case ValueFault::NotText: return Tr("%1 takes no line breaks and no NUL bytes.", row.name);
     case ValueFault::NotName:
-      return "Invalid destination. " + takes + "a name, not a path: no \"/\", \"\\\", \"..\" or control characters.";
-    case ValueFault::Internal: return std::string(row.name) + " is the program's own value and cannot be set.";
+      return Tr("Invalid destination. %1 takes a name, not a path: no \"/\", \"\\\", \"..\" or control characters.", row.name);
+    case ValueFault::Internal: return Tr("%1 is an internal value and cannot be set.", row.name);
   }
   return {};
 }

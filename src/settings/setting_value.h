@@ -22,7 +22,7 @@ enum class ValueFault {
   Internal,    // the program's own value
 };
 
-// Where a value comes from. A person is told of every fault. A file is not: what can be used of it is.
+// Where a value comes from. A person is told about every fault. A file is not: what can be used of it is.
 enum class ValueSource { Person, File };
 
 // A value that was read, and what is wrong with it.
@@ -33,7 +33,7 @@ struct SettingValue {
   std::string_view text;  // keys with it; a view into what was read
 };
 
-// Reads a value as it stands in the configuration file or on a command line, whole and with its blanks. Numbers are
+// Reads a value as it is in the configuration file or on a command line, whole and with its blanks. Numbers are
 // decimal; a person may write 0x. From a file a flag is 1 for any number but 0, a text with a limit is cut to it, and
 // numbers outside their list or range stay, since whoever acts on them must be ready for them anyway.
 SettingValue ReadValue(const KeyRow& row, std::string_view value, ValueSource source);

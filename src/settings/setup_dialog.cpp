@@ -6,6 +6,7 @@
 #include "core/text.h"
 #include "settings/configuration.h"
 #include "settings/setting_value.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -123,8 +124,7 @@ ControlValue ReadControl(const SetupDialog& dialog, const DestinationSource& des
   } else if ((row.type & KEY_SPIN) != 0) {
     const SpinRange range = RangeIn(dialog, row);
     if (value.number < range.minimum || value.number > range.maximum) {
-      control.fault = std::string(row.name) + " takes a number from " + std::to_string(range.minimum) + " to " +
-                      std::to_string(range.maximum) + ".";
+      control.fault = Tr("%1 takes a number from %2 to %3.", row.name, range.minimum, range.maximum);
     }
   }
   return control;

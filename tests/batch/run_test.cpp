@@ -60,7 +60,7 @@ TEST_F(Run, SeveralAtATimeGiveWhatOneAfterTheOtherGives) {
       files.push_back({path, {}, Status::Ok, {}});
     }
     WriteText(In(folder) + "/b.bmp", "broken");
-    files.push_back({In("none.bmp"), {}, Status::FileOpenError, "There is no such file."});
+    files.push_back({In("none.bmp"), {}, Status::FileOpenError, "The file does not exist."});
     files.push_back({In("vanished.bmp"), {}, Status::Ok, {}});
   }
   const struct {

@@ -43,10 +43,10 @@ TEST(Turn, FilesChangeOnlyWhereNothingIsLost) {
       {"deep.png",
        Hex("89504E470D0A1A0A0000000D49484452000000010000000110000000006AEE47160000000B49444154789C6310320100005B004796FB1B"
            "650000000049454E44AE426082"),
-       "It holds more than would be written again."},
+       "The file has data that would be lost."},
       {"e.gif",
        Hex("474946383961 0100 0100 800000 000000FFFFFF 2C00000000010001000002024401 00 2C00000000010001000002024C01 00 3B"),
-       "It holds several pictures, of which only one would be left."},
+       "The file has several pictures; all but one would be lost."},
       {"f.jpg", Hex("FFD8FFD9"), ""},
   };
   for (const auto& row : rows) {
@@ -86,7 +86,7 @@ TEST(Turn, AFileThatWouldLoseItsTextsStaysAsItIs) {
   const struct {
     const PicturePointer& picture;
     const char* hint;
-  } rows[] = {{commented, "Its comment would be lost."}, {tagged, "Its EXIF, XMP or color profile would be lost."}};
+  } rows[] = {{commented, "The comment would be lost."}, {tagged, "EXIF, XMP or the color profile would be lost."}};
   const std::string path = folder.Path("a.png");
   for (const auto& row : rows) {
     SCOPED_TRACE(row.hint);
@@ -119,9 +119,9 @@ TEST(Turn, SelectionsKeepTheirNamesAndTheirOldFiles) {
   const std::vector<std::string> lines = LinesOf(job);
   ASSERT_GE(lines.size(), 4u);
   EXPECT_EQ(lines[0], folder.Path("a.bmp") + " -> " + folder.Path("a.bmp"));
-  EXPECT_EQ(lines[1], folder.Path("b.bmp") + ": Error creating file. There is no room to keep the old file for undo.");
-  EXPECT_NE(lines[2].find("named twice"), std::string::npos);
-  EXPECT_NE(lines[3].find("It is a link"), std::string::npos);
+  EXPECT_EQ(lines[1], folder.Path("b.bmp") + ": Error creating file. There is not enough disk space to keep the old file for undo.");
+  EXPECT_NE(lines[2].find("listed twice"), std::string::npos);
+  EXPECT_NE(lines[3].find("This is a link"), std::string::npos);
   EXPECT_NE(ReadBytes(folder.Path("a.bmp")), bitmap);
   EXPECT_EQ(ReadBytes(folder.Path("b.bmp")), bitmap);
   EXPECT_TRUE(fs::is_symlink(folder.Path("link.bmp")));

@@ -34,7 +34,7 @@ STEPS = [
     (["set", "PrefixCrop", "../up"], 2, b"", "Invalid destination.", None),
     (["set", "PrefixCrop", "x" * 33], 2, b"", "at most 32 characters", None),
     (["set", "UseAlphaChannels", "yes"], 2, b"", "UseAlphaChannels takes 0 or 1.", None),
-    (["set", "VersionNumber", "1"], 2, b"", "the program's own value", None),
+    (["set", "VersionNumber", "1"], 2, b"", "internal value", None),
     (["set", "FindSimilarDistance", "1"], 2, b"", "FindSimlarDistance", None),
     (["get", "jpegcompression"], 2, b"", "JpegCompression", None),
     (["unset", "-n", "PrefixCrop"], 0, b"PrefixCrop: Cut out  -> Cropped_ \n", "", None),
@@ -93,7 +93,7 @@ def test_unreadable(folder):
     os.mkdir(folder / NAME)
     status, out, error = run(folder, "config", "set", "JpegCompression", "80")
     check("set", (status, out), (1, b""))
-    check("message", error, f"{folder / NAME}: The configuration file is there but cannot be read, so it was left as it is.\n")
+    check("message", error, f"{folder / NAME}: The configuration file cannot be read; left unchanged.\n")
     check("get", run(folder, "config", "get", "JpegCompression")[:2], (0, b"75\n"))
 
 

@@ -64,11 +64,11 @@ TEST_F(Convert, UsageErrorsTouchNothing) {
     const char* message;
   } rows[] = {
       {"no format", {In("a.bmp")}, "--to"},
-      {"unknown format", {In("a.bmp"), "-t", "bm"}, "There is no format \"bm\". Did you mean \"bmp\"?"},
-      {"three characters do not do", {In("a.bmp"), "-t", "bmpx"}, "There is no format \"bmpx\"."},
+      {"unknown format", {In("a.bmp"), "-t", "bm"}, "Unknown format \"bm\". Did you mean \"bmp\"?"},
+      {"three characters do not do", {In("a.bmp"), "-t", "bmpx"}, "Unknown format \"bmpx\"."},
       {"format that is only read", {In("a.bmp"), "-t", "otf"}, "OTF cannot be written."},
       {"name without format", {In("a.bmp"), "-o", In("x.abc")}, "selects no format"},
-      {"two places", {In("a.bmp"), "-t", "pcx", "-o", In("x.pcx"), "-d", In("d")}, "excludes"},
+      {"two places", {In("a.bmp"), "-t", "pcx", "-o", In("x.pcx"), "-d", In("d")}, "cannot be combined"},
       {"one name for two", {In("a.bmp"), In("mono.bmp"), "-o", In("x.pcx")}, "exactly one"},
       {"prefix that leads up", {In("a.bmp"), "-t", "pcx", "--prefix", "../"}, "prefix"},
       {"prefix into a folder", {In("a.bmp"), "-t", "pcx", "--prefix", "d/"}, "prefix"},
@@ -232,7 +232,7 @@ TEST_F(Convert, DryRunSaysTheSameAndDoesNothing) {
 TEST_F(Convert, PagesBeyondTheLast) {
   const CommandResult result = Run({In("a.bmp"), "-t", "pcx", "--page", "2"});
   EXPECT_EQ(result.status, 1);
-  EXPECT_THAT(result.err, HasSubstr("No images in this document. It has one page."));
+  EXPECT_THAT(result.err, HasSubstr("No images in this document. The file has only one page."));
 }
 
 }  // namespace

@@ -55,7 +55,7 @@ TEST_F(ExifCommand, PrintsTheLinesOfTheViewer) {
   EXPECT_EQ(result.out, kBlockText);
   EXPECT_EQ(Exif({picture, picture}).out, picture + "\n" + kBlockText + picture + "\n" + kBlockText);
   const uint32_t usual = std::exchange(limits.exifEntries, 3);
-  EXPECT_THAT(Exif({picture}).err, HasSubstr("picture.tif: There is more EXIF than is shown here."));
+  EXPECT_THAT(Exif({picture}).err, HasSubstr("picture.tif: Not all EXIF entries are shown."));
   limits.exifEntries = usual;
 }
 

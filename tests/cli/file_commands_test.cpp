@@ -71,7 +71,7 @@ TEST_F(FileCommands, SelectionKeepsItsOrder) {
       {"list", {"--files-from", In("list")}, {"sub/c.bmp", "a.bmp"}},
       {"names, then list", {In("b.BMP"), "--files-from", In("list")}, {"b.BMP", "sub/c.bmp", "a.bmp"}},
       {"list with zeros", {"-0", "--files-from", In("zeros")}, {"b.BMP", "a.bmp"}},
-      {"named twice", {In("a.bmp"), In("a.bmp")}, {"a.bmp", "a.bmp"}},
+      {"listed twice", {In("a.bmp"), In("a.bmp")}, {"a.bmp", "a.bmp"}},
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.name);
@@ -97,10 +97,10 @@ TEST_F(FileCommands, WhatCannotBeOpenedFailsAloneWithAMessage) {
     int number;
     const char* message;
   } rows[] = {
-      {"missing.bmp", 1, "File open error. There is no such file."},
+      {"missing.bmp", 1, "File open error. The file does not exist."},
       {"pipe.bmp", 1, "File open error."},
       {"dangling.bmp", 1, "File open error."},
-      {"notes", 8, "Unsupported format. No format goes by that extension."},
+      {"notes", 8, "Unsupported format. Unknown file extension."},
       {"text.bmp", 2, "Damaged file."},
       {"photo.avif", 5, "Unsupported function. It looks like AVIF."},
   };
@@ -163,7 +163,7 @@ TEST_F(FileCommands, ClosingLines) {
       {{"verify", In("a.bmp")}, 0, "One file was processed.\n"},
       {{"verify", In("a.bmp"), In("b.BMP")}, 0, "2 files were processed.\n"},
       {{"-q", "verify", In("a.bmp")}, 0, ""},
-      {{"-q", "verify", In("no.bmp")}, 1, In("no.bmp") + ": File open error. There is no such file.\n"},
+      {{"-q", "verify", In("no.bmp")}, 1, In("no.bmp") + ": File open error. The file does not exist.\n"},
   };
   for (const auto& row : rows) {
     const CommandResult result = RunCommand(row.arguments);
@@ -253,8 +253,8 @@ TEST(DoctorCommand, TellsWhatIsWrongWithTheConfiguration) {
   EXPECT_THAT(result.out, HasSubstr("Data folder     " + folder.Path() + "\n"));
   EXPECT_THAT(result.out, HasSubstr("  line 2        JpegCompression=high: JpegCompression takes"));
   EXPECT_THAT(result.out, testing::Not(HasSubstr("PngCompression")));
-  EXPECT_THAT(result.out, HasSubstr("\n  Switched off: EXE EPS JFI JPE\n"));
-  EXPECT_THAT(RunCommand({"--data", folder.Path("none"), "--no-plugins", "doctor"}).out, HasSubstr("not there yet"));
+  EXPECT_THAT(result.out, HasSubstr("\n  Disabled: EXE EPS JFI JPE\n"));
+  EXPECT_THAT(RunCommand({"--data", folder.Path("none"), "--no-plugins", "doctor"}).out, HasSubstr("does not exist yet"));
 }
 
 }  // namespace

@@ -107,7 +107,7 @@ TEST_F(FileDeedsTest, NothingIsEverReplaced) {
   for (const DeedKind kind : {DeedKind::Move, DeedKind::Copy}) {
     const DeedResult result = CarryOut({kind, plan.steps});
     EXPECT_THAT(result.done.steps, IsEmpty());
-    EXPECT_EQ(result.failures.at(0).reason, "There is a file of that name already.");
+    EXPECT_EQ(result.failures.at(0).reason, "A file of that name already exists.");
   }
   EXPECT_EQ(ReadText(To("a.png")) + ReadText(To("a [1].png")) + ReadText(From("a.png")), "therecame meanwhilea.png");
   // Undoing a move whose old name was given away leaves both files.

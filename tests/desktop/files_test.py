@@ -171,7 +171,7 @@ def turn_and_take_back(folder):
         desktop.key("ctrl+z")
         desktop.wait(r"files Undo rotation of 2 files done=1 failed=1")
         assert changed() == [False, True], changed()
-        desktop.focus("Not everything", native=True)
+        desktop.focus("Some files failed", native=True)
         desktop.key("Return")
 
 

@@ -194,7 +194,7 @@ TEST_F(Reports, CompactionTellsWhatItDid) {
     while (!compaction.Ended()) std::this_thread::yield();
     return std::pair(compaction.Succeeded(), compaction.Outcome());
   };
-  EXPECT_EQ(outcome(), std::pair(false, std::string("There is no thumbnail database of that name.")));
+  EXPECT_EQ(outcome(), std::pair(false, std::string("This thumbnail database does not exist.")));
   {
     ThumbnailDatabase database;
     ASSERT_EQ(database.OpenThumbnailDatabase(path, true), ThumbnailDatabase::Opened::Done);

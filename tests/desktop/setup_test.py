@@ -84,7 +84,7 @@ def info_exif_history(folder):
         desktop.focus("File history")
         desktop.screenshot("history")
         desktop.key("Delete")
-        desktop.wait(r"question Take .a.bmp. out")
+        desktop.wait(r"question Remove .a.bmp. from")
         desktop.focus("Remove history entries")
         desktop.screenshot("question")
         desktop.key("alt+r")

@@ -52,7 +52,7 @@ TEST(TurnedJpeg, PixelsAreThoseOfJpegtran) {
         const auto orientation = static_cast<Orientation>(number);
         const Bytes ours = Turned(file, {.turn = orientation}, result);
         if (RunShell(command + "-perfect " + old)) {
-          ASSERT_EQ(result.way, JpegTurnWay::Pixels) << result.obstacle;
+          ASSERT_EQ(result.way, JpegTurnWay::Pixels) << result.obstacle.english;
           EXPECT_TRUE(LookAlike(ours, ReadBytes(theirs)));
           EXPECT_EQ(Decode(JpegRead, ours).picture->typeName.view(), Decode(JpegRead, file).picture->typeName.view());
           continue;

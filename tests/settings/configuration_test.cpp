@@ -78,7 +78,7 @@ TEST_F(ConfigurationTest, TakesWhatTheFileHolds) {
       {"prefix that leads elsewhere", "PrefixCrop=../", "PrefixCrop", "Cropped_ ", ValueFault::NotName},
       {"database name that is a path", "FileHistoryDatabase=a\\b", "FileHistoryDatabase", "FMWFileHistoryDatabase",
        ValueFault::NotName},
-      {"the program's own value", "VersionNumber=7", "VersionNumber", "352"},
+      {"internal value", "VersionNumber=7", "VersionNumber", "352"},
   };
   for (const Row& row : rows) {
     SCOPED_TRACE(row.name);
@@ -206,8 +206,8 @@ TEST_F(ConfigurationTest, ValuesForOneRunAreNotWritten) {
       {"PrefixCrop", "a name that has thirty-three bytes", SetResult::WrongValue, "PrefixCrop takes at most 32 characters."},
       {"PrefixCrop", "a/b", SetResult::WrongValue,
        "Invalid destination. PrefixCrop takes a name, not a path: no \"/\", \"\\\", \"..\" or control characters."},
-      {"AnnotateText", "two\nlines", SetResult::WrongValue, "AnnotateText takes no line breaks and no zero bytes."},
-      {"PatchLevel", "1", SetResult::WrongValue, "PatchLevel is the program's own value and cannot be set."},
+      {"AnnotateText", "two\nlines", SetResult::WrongValue, "AnnotateText takes no line breaks and no NUL bytes."},
+      {"PatchLevel", "1", SetResult::WrongValue, "PatchLevel is an internal value and cannot be set."},
   };
   for (const Row& row : rows) {
     SCOPED_TRACE(std::string(row.key).append("=").append(row.value));

@@ -17,20 +17,23 @@
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "platform/reserved_memory.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
 namespace {
 
 constexpr std::string_view kNames[] = {
-    "View",      "Paint",          "Contact sheet", "Web gallery",   "Annotate",          "Print", "Transform", "Filter",
-    "Effects",   "Convert",        "Get info",      "Move and copy", "Copy to clipboard", "Crop",  "Matt",      "Watermark",
-    "File time", "Photo workshop", "Find similar",  "Catalog"};
+    TrLater("View"),      TrLater("Paint"),          TrLater("Contact sheet"), TrLater("Web gallery"),
+    TrLater("Annotate"),  TrLater("Print"),          TrLater("Transform"),     TrLater("Filter"),
+    TrLater("Effects"),   TrLater("Convert"),        TrLater("Get info"),      TrLater("Move and copy"),
+    TrLater("Copy to clipboard"), TrLater("Crop"),   TrLater("Matt"),          TrLater("Watermark"),
+    TrLater("File time"), TrLater("Photo workshop"), TrLater("Find similar"),  TrLater("Catalog")};
 static_assert(std::size(kNames) == kFileFunctionCount);
 
 constexpr std::string_view kExtension = ".fhdb";
 constexpr std::string_view kPathTag = "\tPATH:", kFunctionTag = "\tFUNCTION:", kAccessedTag = "\tACCESSED:", kEndTag = "\tEND:";
-constexpr size_t kLongestLine = 4095;  // what is longer goes on as a line of its own
+constexpr size_t kLongestLine = 4095;  // what is longer continues as a line of its own
 
 // What is known of an entry. With the thumbnail that belongs to it in the list's window it is one slot.
 #pragma pack(push, 1)
@@ -49,7 +52,7 @@ int32_t Clamped(int64_t seconds) { return static_cast<int32_t>(std::clamp<int64_
 
 std::string_view PathOf(const Slot& slot) { return {slot.path, strnlen(slot.path, sizeof slot.path - 1)}; }
 
-// Whether `a` stands before `b`: the later use, of equal ones the higher file name, then the higher path.
+// Whether `a` is before `b`: the later use, of equal ones the higher file name, then the higher path.
 bool StandsBefore(const Slot& a, const Slot& b) {
   if (a.accessed != b.accessed) return a.accessed > b.accessed;
   const std::string_view aName = platform::FileNameOf(PathOf(a)), bName = platform::FileNameOf(PathOf(b));
@@ -119,7 +122,7 @@ class HistoryList {
   Slot* Slots() { return room_.Items<Slot>(0, used_).data(); }
   const Slot* Slots() const { return const_cast<HistoryList*>(this)->Slots(); }
 
-  // Where a slot stands in the order, or would stand.
+  // Where a slot is in the order, or would be.
   std::vector<uint32_t>::iterator Place(uint32_t number) {
     return std::lower_bound(order_.begin(), order_.end(), number,
                             [this](uint32_t a, uint32_t b) { return a != b && StandsBefore(Slots()[a], Slots()[b]); });
@@ -153,7 +156,7 @@ class HistoryList {
   platform::ReservedMemory room_;
   uint64_t capacity_ = 0;           // entries
   uint32_t used_ = 0;               // slots that ever held an entry
-  std::vector<uint32_t> order_;     // slots as they stand in the list
+  std::vector<uint32_t> order_;     // slots as they are in the list
   std::vector<uint32_t> free_;      // slots whose entry is gone
   std::vector<bool> hasThumbnail_;  // of slots
   std::unordered_map<std::string, uint32_t> slotOf_;

@@ -55,7 +55,7 @@ struct HistoryOptions {
 
 // Its name as lists show it; empty for a number that is none.
 std::string_view FileFunctionName(int32_t function);
-// The function of a name, whatever its case; kNoFileFunction when there is none.
+// The function of a name, whatever its case; kNoFileFunction if there is none.
 int32_t FileFunctionOfName(std::string_view name);
 
 // Stands for the file's own creation time, or for now.
@@ -69,7 +69,7 @@ bool FitsFileHistory(std::string_view path);
 // regular file or does not fit, or there is no memory.
 bool RecordFileHistory(const HistoryOptions& options, std::string_view path, FileFunction function, int32_t created = kOwnTime,
                        int32_t accessed = kOwnTime);
-// Takes the entry of a path out of the list. False when there is none.
+// Takes the entry of a path out of the list. False if there is none.
 bool RemoveFromFileHistory(std::string_view path);
 
 // Reads the history file into the list. False when the history is switched off or the file cannot be read.
@@ -93,7 +93,7 @@ struct FileHistoryEntry {
 // How many entries the list has; 0 while it is not loaded.
 size_t FileHistoryCount();
 FileHistoryEntry FileHistoryAt(size_t index);  // from 0, the last use first
-// The thumbnail of an entry, read from its file's thumbnail file when it is first asked for; null when there is none. It
+// The thumbnail of an entry, read from its file's thumbnail file when it is first asked for; null if there is none. It
 // stays where it is until the list changes.
 const ThumbnailRecord* FileHistoryThumbnail(size_t index);
 
@@ -111,10 +111,10 @@ enum class HistoryUpdate {
   Done,     // loaded, recorded and saved
   Off,      // switched off: nothing was recorded
   NotRead,  // the history file cannot be read, or is something else: it was left alone
-  Failed,   // it could not be written, or there is no place for it: it is as it was
+  Failed,   // it could not be written, or there is no place for it: it is unchanged
 };
-// Records uses, in order, for good: locks the history file, reads it afresh, so that what other processes recorded stays,
-// records, and replaces the file in one step. `recorded` counts the uses that were. With the history switched off for good the
+// Records uses, in order, permanently: locks the history file, reads it afresh, so that what other processes recorded stays,
+// records, and replaces the file in one step. `recorded` counts the uses that were. With the history switched off permanently the
 // history file is deleted; switched off for this run only, it stays. The list is free afterwards.
 HistoryUpdate UpdateFileHistory(const HistoryOptions& options, std::span<const FileUse> uses, size_t* recorded = nullptr);
 

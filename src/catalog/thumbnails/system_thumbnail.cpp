@@ -19,7 +19,7 @@ namespace {
 constexpr std::string_view kUriKey = "Thumb::URI", kTimeKey = "Thumb::MTime";
 constexpr std::string_view kAllowedMarks = "-_.!~*'():@&=+$,/";
 
-// The folders of the cache and the longest side of what lies in them.
+// The folders of the cache and the longest side of what is in them.
 struct CacheFolder {
   const char* name;
   int32_t side;

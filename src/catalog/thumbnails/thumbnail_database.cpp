@@ -43,7 +43,7 @@ std::array<uint8_t, kDatabaseHeaderSize> BytesOf(const DatabaseHeader& header) {
   return bytes;
 }
 
-// What stands behind the thumbnail.
+// What is behind the thumbnail.
 using KeyBytes = std::array<uint8_t, kKeySize>;
 
 bool BytesOf(const DatabaseRecord& record, KeyBytes& bytes) {
@@ -275,7 +275,7 @@ bool ThumbnailDatabase::MarkDeleted(int64_t index) {
   return file_.WriteAt(OffsetOf(index) + kFlagsOffset, {&flags, 1});
 }
 
-// The records of the same paths and volumes as new ones, which are to stand from `first` on: those that are there, and new
+// The records of the same paths and volumes as new ones, which are to be from `first` on: those that are there, and new
 // ones that come again further on. False when one cannot be read.
 bool ThumbnailDatabase::FindRecordsToReplace(std::span<const DatabaseRecord> records, int64_t first,
                                              std::vector<int64_t>& replaced) const {

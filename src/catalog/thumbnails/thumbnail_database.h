@@ -32,8 +32,8 @@ namespace fotomill {
 //            28434    1  flags: bit 0 set, the record is deleted
 //            28435    7  0
 //
-// The global database lies in the data folder, a local one in the folder of its pictures. A record is written and on disk
-// before the header counts it; what stands behind the counted ones means nothing.
+// The global database is in the data folder, a local one in the folder of its pictures. A record is written and on disk
+// before the header counts it; what is behind the counted ones means nothing.
 inline constexpr size_t kDatabaseHeaderSize = 60;
 inline constexpr size_t kDatabaseRecordSize = 28442;
 inline constexpr std::string_view kDatabaseMagic = "BRNTTDBX";
@@ -102,7 +102,7 @@ class ThumbnailDatabase {
   bool ReadDatabaseHeader(DatabaseHeader& header) const;
   // How many of the counted records the file holds.
   int64_t RecordCount(const DatabaseHeader& header) const;
-  // False beyond the end of the file, or when there is no small thumbnail.
+  // False beyond the end of the file, or if there is no small thumbnail.
   bool ReadDatabaseRecord(int64_t index, DatabaseRecord& record) const;
   // The same without the thumbnail's pixels.
   bool ReadKey(int64_t index, DatabaseKey& key) const;
@@ -114,7 +114,7 @@ class ThumbnailDatabase {
   bool AppendDatabaseRecord(const DatabaseRecord& record) { return AppendDatabaseRecords({&record, 1}, false); }
   // Puts a record in the place of one that is counted, and has it on disk.
   bool WriteDatabaseRecord(int64_t index, const DatabaseRecord& record);
-  // The thumbnail of the first record that is not deleted, of that path and volume. False when there is none; `thumbnail`
+  // The thumbnail of the first record that is not deleted, of that path and volume. False if there is none; `thumbnail`
   // may then hold anything.
   bool Find(const std::string& path, const std::string& volume, ThumbnailRecord& thumbnail);
   // Marks every record of a path deleted, whatever its volume; how many there were, -1 when it could not be done.

@@ -21,7 +21,7 @@ inline constexpr uint32_t kDrawGray = 8;
 // Edge of the square that a record fills when it is drawn.
 int32_t DrawnThumbnailSide(const AnyThumbnailRecord& record, uint32_t flags);
 
-// Draws a record into a 24-bit bitmap, the square's top left corner at column x, row y from the top; what lies outside
+// Draws a record into a 24-bit bitmap, the square's top left corner at column x, row y from the top; what is outside
 // the bitmap is left out. A small record is enlarged for the large view with the filter of the options, or by
 // spreading its pixels. False without memory, or when the bitmap has another depth; it is then
 // as before.

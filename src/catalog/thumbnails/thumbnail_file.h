@@ -21,7 +21,7 @@ std::string ThumbnailPathFor(std::string_view picturePath);
 // Fills a record from a thumbnail file; old records are expanded, and keep their version. A file that is shorter than a
 // record counts as an old one. False when it cannot be read or is no thumbnail file; `record` is then as before.
 bool ReadThumbnailFile(ThumbnailRecord& record, const std::string& path);
-// Fills a record from the thumbnail file of a picture, as it stands there. False unless it holds a whole record; `record`
+// Fills a record from the thumbnail file of a picture, as it is there. False unless it holds a whole record; `record`
 // is then zero.
 bool ReadThumbnailForPicture(const std::string& picturePath, ThumbnailRecord& record);
 

@@ -136,7 +136,7 @@ void ThumbnailIndex::Remove(size_t record) {
   const size_t mask = cells_.size() - 1;
   for (size_t cell = Next(hole); cells_[cell] != kFree; cell = Next(cell)) {
     const size_t home = Home(hashes_[cells_[cell] - 1]);
-    if (((cell - home) & mask) < ((cell - hole) & mask)) continue;  // its home lies behind the hole
+    if (((cell - home) & mask) < ((cell - hole) & mask)) continue;  // its home is behind the hole
     cells_[hole] = cells_[cell];
     hole = cell;
   }

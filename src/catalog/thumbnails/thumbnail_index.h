@@ -15,7 +15,7 @@ namespace fotomill {
 // it and compares. Records are numbered as in the database; those that are deleted or hold no thumbnail are in no
 // table.
 //
-// A large index lies between two runs in a file beside the database, little-endian. It is a copy of what the database
+// A large index is between two runs in a file beside the database, little-endian. It is a copy of what the database
 // says: a file that is damaged or belongs to another state of the database counts for nothing, and may be deleted.
 //
 //   offset size      field

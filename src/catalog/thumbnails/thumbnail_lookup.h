@@ -22,7 +22,7 @@ struct ThumbnailSources {
 };
 
 // Fills a record with the thumbnail of a picture as the mode says: thumbnail file, list, database or, for a large view
-// in the disk-based mode, the system's cache. Large records come from that cache only. False when there is no
+// in the disk-based mode, the system's cache. Large records come from that cache only. False if there is no
 // thumbnail.
 bool LookUpThumbnail(const std::string& picturePath, bool large, const ThumbnailSources& sources, AnyThumbnailRecord& record);
 

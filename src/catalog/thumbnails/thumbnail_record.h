@@ -21,7 +21,7 @@ namespace fotomill {
 //        6  258            0
 //      264    3 x side^2   pixels: blue, green, red, bottom row first, rows without padding; side 96, or 176
 //
-// The picture stands in the middle, offsets rounded down; the rest has the background's color. Small records of versions
+// The picture is in the middle, offsets rounded down; the rest has the background's color. Small records of versions
 // below 2 hold 96 x 96 indices into ThumbnailPalette() instead, in the same order of rows.
 inline constexpr size_t kThumbnailHeaderSize = 264;
 inline constexpr int16_t kThumbnailVersion = 512;
@@ -30,7 +30,7 @@ inline constexpr int32_t kLargeThumbnailSide = 176;
 inline constexpr std::string_view kSmallThumbnailMagic = "THNL";
 inline constexpr std::string_view kLargeThumbnailMagic = "tHNL";
 
-// A record of either size. It holds its bytes as they stand in a file.
+// A record of either size. It holds its bytes as they are in a file.
 template <int32_t side>
 struct SquareThumbnailRecord {
   static constexpr int32_t kSide = side;

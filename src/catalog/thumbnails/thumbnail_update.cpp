@@ -8,14 +8,16 @@
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "platform/volumes.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
 const ThumbnailUpdateChoice kThumbnailUpdateChoices[4] = {
-    {kUpdateCreate, "&Create thumbnails now. This may take a few seconds."},
-    {kUpdateLater, "&Don't create thumbnails now, but display this prompt in the future."},
-    {kUpdateNotHere, "D&on't create thumbnails now and don't display this prompt again for this browser."},
-    {kUpdateNever, "Do&n't create thumbnails now and never display this prompt again. This option can be reversed in Setup."},
+    {kUpdateCreate, TrLater("&Create thumbnails now. This may take a few seconds.")},
+    {kUpdateLater, TrLater("&Don't create thumbnails now, but display this prompt in the future.")},
+    {kUpdateNotHere, TrLater("D&on't create thumbnails now and don't display this prompt again for this browser.")},
+    {kUpdateNever,
+     TrLater("Do&n't create thumbnails now and never display this prompt again. This option can be reversed in Setup.")},
 };
 
 namespace {
@@ -37,7 +39,7 @@ bool MakeRecordsInMemory(const ThumbnailBrowser& browser, ThumbnailUpdateFace& f
     const std::string& file = browser.files[i];
     const std::string path = platform::JoinFolder(browser.folder, file);
     if (file.starts_with('.') || HasThumbnailFile(path)) continue;
-    if (!face.ShowProgress("Creating thumbnails", i, browser.files.size())) return false;
+    if (!face.ShowProgress(Tr("Creating thumbnails"), i, browser.files.size())) return false;
     ThumbnailRecord record;
     if (MakeThumbnailOfFile(path, browser.options.making, record) == Status::Ok) face.AttachRecord(file, record);
   }
@@ -46,7 +48,7 @@ bool MakeRecordsInMemory(const ThumbnailBrowser& browser, ThumbnailUpdateFace& f
 
 // The files of the list without a thumbnail file. False when it was given up.
 bool FindMissing(const ThumbnailBrowser& browser, ThumbnailUpdateFace& face, std::vector<std::string>& missing) {
-  const std::string text = "Scanning " + browser.folder;
+  const std::string text = Tr("Scanning %1", browser.folder);
   for (size_t i = 0; i < browser.files.size(); ++i) {
     if (!face.ShowProgress(text, i, browser.files.size())) return false;
     if (!HasThumbnailFile(platform::JoinFolder(browser.folder, browser.files[i]))) missing.push_back(browser.files[i]);
@@ -82,8 +84,8 @@ void ApplyChoice(int32_t choice, const std::vector<std::string>& missing, Thumbn
 }  // namespace
 
 std::string ThumbnailUpdateQuestion(int32_t count) {
-  return std::to_string(count) +
-         " file(s) in this folder do not have display thumbnails associated with them. Fotomill can create these for you now.";
+  return Tr("%1 file(s) in this folder do not have display thumbnails associated with them. Fotomill can create these for you now.",
+            count);
 }
 
 bool OfferThumbnailUpdate(ThumbnailBrowser& browser, ThumbnailUpdateFace& face) {

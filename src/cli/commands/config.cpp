@@ -9,6 +9,7 @@
 #include "cli/frame/shown_text.h"
 #include "platform/files.h"
 #include "settings/configuration.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
@@ -20,7 +21,7 @@ struct ConfigOptions {
   bool dryRun = false;
 };
 
-// Texts of the configuration are bytes. Where they are not UTF-8, each byte stands for the character of that number.
+// Configuration texts are bytes. If they are not UTF-8, they are read as Latin-1.
 std::string JsonText(std::string_view text) {
   if (IsUtf8(text)) return std::string(text);
   std::string wide;
@@ -48,18 +49,22 @@ Json KeyElement(const KeyRow& row) {
   return element;
 }
 
+std::string UnknownKey(const std::string& name) {
+  return Tr("Unknown key \"%1\"; the nearest is %2.", name, NearestKey(name));
+}
+
 void PrintProblem(const CommandContext& context, std::string_view message) {
   const std::string path = context.io.errTerminal ? EscapeControls(ConfigurationPath()) : ConfigurationPath();
   std::fprintf(context.io.err, "%s: %.*s\n", path.empty() ? "fotomill" : path.c_str(), static_cast<int>(message.size()),
                message.data());
 }
 
-// The rows of all named keys; false, after a message, when one is unknown.
+// The rows of all named keys; false, after a message, if one is unknown.
 bool FindKeys(const CommandContext& context, std::vector<const KeyRow*>& rows) {
   for (const std::string& name : context.names.values) {
     rows.push_back(FindKey(name));
     if (rows.back() != nullptr) continue;
-    UsageError(context, "There is no key \"" + name + "\"; the nearest is " + std::string(NearestKey(name)) + ".");
+    UsageError(context, UnknownKey(name));
     return false;
   }
   return true;
@@ -67,7 +72,7 @@ bool FindKeys(const CommandContext& context, std::vector<const KeyRow*>& rows) {
 
 void NoteUnreadable(const CommandContext& context) {
   if (StateOfConfiguration() != ConfigurationState::Unreadable) return;
-  PrintProblem(context, "The configuration file cannot be read; the defaults stand.");
+  PrintProblem(context, Tr("The configuration file cannot be read; the defaults apply."));
 }
 
 int RunList(const ConfigOptions& options, const CommandContext& context) {
@@ -99,7 +104,7 @@ int RunGet(const ConfigOptions& options, const CommandContext& context) {
   return kExitOk;
 }
 
-// One change, done or only foretold: "KEY: OLD -> NEW".
+// Makes or, in a dry run, only shows one change: "KEY: OLD -> NEW".
 int Change(const ConfigOptions& options, const CommandContext& context, const KeyRow& row, const SettingValue* value) {
   const std::string before = ValueText(row);
   SaveResult result = SaveResult::Done;
@@ -110,7 +115,7 @@ int Change(const ConfigOptions& options, const CommandContext& context, const Ke
   } else {
     StoreDefault(row);
   }
-  if (const std::string_view message = SaveMessage(result); !message.empty()) {
+  if (const std::string message = Tr(SaveMessage(result)); !message.empty()) {
     PrintProblem(context, message);
     return kExitFailed;
   }
@@ -127,7 +132,7 @@ int RunSet(const ConfigOptions& options, const CommandContext& context) {
   const std::string& name = context.names.values[0];
   const KeyRow* const row = FindKey(name);
   if (row == nullptr) {
-    return UsageError(context, "There is no key \"" + name + "\"; the nearest is " + std::string(NearestKey(name)) + ".");
+    return UsageError(context, UnknownKey(name));
   }
   const SettingValue value = ReadValue(*row, context.names.values[1], ValueSource::Person);
   if (!value.usable) return UsageError(context, FaultMessage(*row, value.fault));
@@ -143,7 +148,7 @@ int RunUnset(const ConfigOptions& options, const CommandContext& context) {
 int RunPath(const ConfigOptions& options, const CommandContext& context) {
   const std::string path = ConfigurationPath();
   if (path.empty()) {
-    PrintProblem(context, SaveMessage(SaveResult::NoFolder));
+    PrintProblem(context, Tr(SaveMessage(SaveResult::NoFolder)));
     return kExitFailed;
   }
   ResultOutput output(context, options.json);
@@ -163,39 +168,39 @@ using Run = int (*)(const ConfigOptions& options, const CommandContext& context)
 std::shared_ptr<ConfigOptions> SetUp(CLI::App& app, CommandContext& context, Run run, const char* jsonHelp, const char* example) {
   auto options = std::make_shared<ConfigOptions>();
   AddFlag(app, "--json", options->json, jsonHelp);
-  SetFooter(app, std::string("Example: ") + example);
+  SetFooter(app, nullptr, example);
   context.run = [options, &context, run] { return run(*options, context); };
   return options;
 }
 
-constexpr const char* kKeyJson = "One JSON array of {name, type, value, default}";
+constexpr const char* kKeyJson = TrLater("Print a JSON array of {name, type, value, default}");
 
 }  // namespace
 
 void SetUpConfigList(CLI::App& app, CommandContext& context) {
   const auto options = SetUp(app, context, RunList, kKeyJson, "fotomill config list --changed");
-  AddFlag(app, "--changed", options->changed, "Only keys that differ from their default");
+  AddFlag(app, "--changed", options->changed, "Only keys that differ from their defaults");
 }
 
 void SetUpConfigGet(CLI::App& app, CommandContext& context) {
-  context.names.Declare("KEY...", "Names of keys; their values are printed one a line", 1);
+  context.names.Declare("KEY...", "Key names; their values are printed one per line", 1);
   SetUp(app, context, RunGet, kKeyJson, "fotomill config get JpegCompression");
 }
 
 void SetUpConfigSet(CLI::App& app, CommandContext& context) {
-  context.names.Declare("KEY VALUE", "Name of a key, and the value it has from now on", 2, 2);
+  context.names.Declare("KEY VALUE", "Key name and its new value", 2, 2);
   const auto options = SetUp(app, context, RunSet, kKeyJson, "fotomill config set JpegCompression 85");
-  AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would change");
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would change");
 }
 
 void SetUpConfigUnset(CLI::App& app, CommandContext& context) {
-  context.names.Declare("KEY", "Name of the key that gets its default again", 1, 1);
+  context.names.Declare("KEY", "Name of the key to reset", 1, 1);
   const auto options = SetUp(app, context, RunUnset, kKeyJson, "fotomill config unset JpegCompression");
-  AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would change");
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would change");
 }
 
 void SetUpConfigPath(CLI::App& app, CommandContext& context) {
-  SetUp(app, context, RunPath, "One JSON array of {path, exists}", "fotomill config path");
+  SetUp(app, context, RunPath, TrLater("Print a JSON array of {path, exists}"), "fotomill config path");
 }
 
 }  // namespace fotomill::cli

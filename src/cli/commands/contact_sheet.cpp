@@ -15,6 +15,7 @@
 #include "pages/catalogue_page.h"
 #include "platform/files.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
@@ -38,10 +39,10 @@ struct SheetOptions {
 
 constexpr int32_t kColumns = 5, kRows = 4, kMostCells = 1000;
 constexpr const char* kNoFont =
-    " There is no font for the names; --no-names does without, the package fonts-dejavu-core has one.";
+    TrLater("No font for the names was found; use --no-names, or install a font (package fonts-dejavu-core).");
 constexpr Color kPaper = 0xFFFFFF;
 
-// A color as people write it, RRGGBB.
+// A color written as RRGGBB.
 std::optional<Color> ColorOf(std::string_view text) {
   uint32_t value = 0;
   if (text.starts_with('#')) text.remove_prefix(1);
@@ -55,7 +56,7 @@ int32_t FirstAbove0(int32_t option, int32_t setting, int32_t usual) {
   return setting > 0 && setting <= kMostCells ? setting : usual;
 }
 
-// What is wrong with the options, as a sentence; empty when nothing is. Fills `sheet`.
+// Fills `look`. Returns what is wrong with the options, a whole sentence; empty if nothing is.
 std::string ReadLook(const SheetOptions& options, CatalogueLook& look) {
   look.columns = FirstAbove0(options.columns, settings.CatalogLandscapeWide, kColumns);
   look.rows = FirstAbove0(options.rows, settings.CatalogLandscapeDeep, kRows);
@@ -68,15 +69,15 @@ std::string ReadLook(const SheetOptions& options, CatalogueLook& look) {
   if (options.blackText) look.background = kPaper;
   if (!options.background.empty()) {
     const auto color = ColorOf(options.background);
-    if (!color) return "--background takes a color as RRGGBB, such as FFFFFF.";
+    if (!color) return Tr("--background takes a color as RRGGBB, such as FFFFFF.");
     look.background = *color;
   }
   const Rectangle page = PageSize(look);
   if (CheckPackedSize(page.width, page.height, 24) != Status::Ok) {
-    return "A page of " + std::to_string(page.width) + " x " + std::to_string(page.height) + " pixels is too large.";
+    return Tr("A page of %1 x %2 pixels is too large.", page.width, page.height);
   }
   const Rectangle first = CellPlace(look, 0);
-  if (first.x < 0 || first.y < 0) return "The page is smaller than its cells.";
+  if (first.x < 0 || first.y < 0) return Tr("The page is smaller than its cells.");
   return {};
 }
 
@@ -89,7 +90,7 @@ int RunSheet(const SheetOptions& options, const CommandContext& context) {
   if (const std::string wrong = ReadDestinationFormat(options.to, job); !wrong.empty()) return UsageError(context, wrong);
   if (const std::string wrong = ReadLook(options, sheet.look); !wrong.empty()) return UsageError(context, wrong);
   if (platform::FileExists(options.dest) && !platform::IsFolder(options.dest)) {
-    return UsageError(context, "\"" + options.dest + "\" is not a folder.");
+    return UsageError(context, Tr("\"%1\" is not a folder.", options.dest));
   }
   const auto files = SelectFiles(options.selection, context);
   if (!files) return kExitUsage;
@@ -102,11 +103,11 @@ int RunSheet(const SheetOptions& options, const CommandContext& context) {
   job.naming.beside = false;
   if (context.MayAsk()) job.prompts = &prompts;
   sheet.page = {.reduce = options.reduce, .dryRun = options.dryRun};
-  sheet.reduceHint = "Use --reduce to have them reduced.";
+  sheet.reduceHint = Tr("Use --reduce to reduce them.");
   sheet.jobs = static_cast<uint32_t>(options.jobs);
   if (const Status status = RunContactSheet(*files, sheet, job); status != Status::Ok) {
-    const std::string message(StatusMessage(status));
-    output.Message(output.ShownMessage(options.dest) + ": " + message + (status == Status::ResourceError ? kNoFont : ""));
+    const std::string hint = status == Status::ResourceError ? std::string(" ") + Tr(kNoFont) : std::string();
+    output.Message(output.ShownMessage(options.dest) + ": " + Tr(StatusMessage(status)) + hint);
     return kExitFailed;
   }
   return FinishBatch(job);
@@ -117,24 +118,26 @@ int RunSheet(const SheetOptions& options, const CommandContext& context) {
 void SetUpContactSheet(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<SheetOptions>();
   AddSelection(app, options->selection, context);
-  Require(AddName(app, "-t,--to", options->to, "EXT", "Format of the pages, by its extension"));
-  Require(AddName(app, "-d,--dest", options->dest, "DIR", "Folder of the pages, made with its parents"));
-  AddNumber(app, "--columns", options->columns, "N", 1, kMostCells, "Pictures side by side; 5 unless CatalogLandscapeWide says");
-  AddNumber(app, "--rows", options->rows, "N", 1, kMostCells, "Pictures one above the other; 4 unless CatalogLandscapeDeep says");
-  AddNumber(app, "--cell", options->cell, "N", 8, 4096, "Pixels of a picture's longer side; 96 unless given");
-  AddNumber(app, "--page-width", options->pageWidth, "N", 1, 65535, "Pixels; as wide as the cells need unless given");
-  AddNumber(app, "--page-height", options->pageHeight, "N", 1, 65535, "The same for the height");
-  AddChoice(app, "--frame", options->frame, "HOW", {"none", "raised", "flat"}, "Frame around each cell; raised unless given");
-  AddFlag(app, "--black-text", options->blackText, "Names and flat frames in black, on white unless --background says");
-  AddText(app, "--background", options->background, "RRGGBB", "Color of the page; 606060 unless given");
-  AddFlag(app, "--no-names", options->noNames, "No names beneath the pictures");
-  AddFlag(app, "--reduce", options->reduce, "Reduce the colors of pages that are too deep for the format");
-  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, INT32_MAX, "Pictures at work at a time; 0, the default, is one a core");
-  AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would be done");
-  AddFlag(app, "--json", options->json, "One JSON array of {file, destination, status, message}");
+  Require(AddName(app, "-t,--to", options->to, "EXT", "Format of the pages, by extension"));
+  Require(AddName(app, "-d,--dest", options->dest, "DIR", "Folder of the pages, created if needed"));
+  AddNumber(app, "--columns", options->columns, "N", 1, kMostCells, "Pictures per row (default: CatalogLandscapeWide, else 5)");
+  AddNumber(app, "--rows", options->rows, "N", 1, kMostCells, "Rows per page (default: CatalogLandscapeDeep, else 4)");
+  AddNumber(app, "--cell", options->cell, "N", 8, 4096, "Longer side of each picture in pixels (default: 96)");
+  AddNumber(app, "--page-width", options->pageWidth, "N", 1, 65535, "Page width in pixels (default: fits the cells)");
+  AddNumber(app, "--page-height", options->pageHeight, "N", 1, 65535, "Page height in pixels (default: fits the cells)");
+  AddChoice(app, "--frame", options->frame, "HOW", "Frame around each cell: none, raised (default) or flat",
+            {"none", "raised", "flat"});
+  AddFlag(app, "--black-text", options->blackText, "Black names and flat frames; on white unless --background is given");
+  AddText(app, "--background", options->background, "RRGGBB", "Page color (default: 606060)");
+  AddFlag(app, "--no-names", options->noNames, "Leave out the file names");
+  AddFlag(app, "--reduce", options->reduce, "Reduce colors if the format supports fewer");
+  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, INT32_MAX, "Number of parallel jobs (default: 0, one per core)");
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be done");
+  AddFlag(app, "--json", options->json, "Print a JSON array of {file, destination, status, message}");
   SetFooter(app,
-            "Pages are called Catalog_00001.EXT and so on, after PrefixCatalog; no page replaces another. The font of the "
-            "names is CatalogFontName.\n\nExample: fotomill contact-sheet holiday -r --to jpg --dest sheets --cell 160");
+            "Pages are named Catalog_00001.EXT and so on; PrefixCatalog sets the prefix. Existing files are never replaced.\n"
+            "CatalogFontName sets the font of the names.",
+            "fotomill contact-sheet holiday -r --to jpg --dest sheets --cell 160");
   context.run = [options, &context] { return RunSheet(*options, context); };
 }
 

@@ -19,6 +19,7 @@
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
@@ -48,10 +49,7 @@ struct ConvertOptions {
 
 constexpr size_t kLongestPrefix = SettingPrefix::Capacity();
 
-constexpr const char* kReduceHint = "Use --reduce to have them reduced.";
-
-// The option decides where it is given. Without it the settings do, and where nobody can be asked, nothing is replaced that
-// they would ask about.
+// The option decides if given, else the settings. If the settings say ask and nobody can answer, both files are kept.
 void SetOverwritePolicy(const ConvertOptions& options, const CommandContext& context, BatchJob& job) {
   const std::string& how = options.overwrite;
   if (how == "ask") job.overwrite.prompt = true;
@@ -68,7 +66,7 @@ BatchFunction FunctionOf(const ConvertOptions& options, const Recipe* recipe) {
                          .page = options.page,
                          .jobs = static_cast<uint32_t>(options.jobs),
                          .reduce = options.reduce,
-                         .reduceHint = kReduceHint,
+                         .reduceHint = Tr("Use --reduce to reduce them."),
                          .autoOrient = options.autoOrient,
                          .keepMetadata = options.metadata == "keep",
                          .keepTimes = options.keepTimes,
@@ -81,11 +79,11 @@ BatchFunction FunctionOf(const ConvertOptions& options, const Recipe* recipe) {
 
 // Reads the format that is asked for into `job`; none where every file keeps its own. What is wrong, or empty.
 std::string ReadFormat(const ConvertOptions& options, bool mayKeep, BatchJob& job) {
-  if (options.to.empty() && options.out.empty()) return mayKeep ? std::string() : "Say with --to which format to convert to.";
+  if (options.to.empty() && options.out.empty()) return mayKeep ? std::string() : Tr("Name the output format with --to.");
   const std::string extension = options.to.empty() ? std::string(platform::ExtensionOf(options.out)) : options.to;
   const std::string wrong = ReadDestinationFormat(extension, job);
   const bool fromName = job.formatIndex == kNoFormat && options.to.empty();
-  return fromName ? "\"" + options.out + "\" selects no format; name one with --to." : wrong;
+  return fromName ? Tr("\"%1\" selects no format; name one with --to.", options.out) : wrong;
 }
 
 // What is wrong with the options, as a sentence; empty when nothing is. Takes the format into `job`.
@@ -94,16 +92,16 @@ std::string CheckOptions(const ConvertOptions& options, const CommandContext& co
                        return !output.save.to.empty();
                      });
   if (const std::string wrong = ReadFormat(options, options.apply || saves, job); !wrong.empty()) return wrong;
-  if (recipe != nullptr && recipe->outputs.size() > 1 && !options.out.empty()) return "--out takes a recipe with one output.";
+  if (recipe != nullptr && recipe->outputs.size() > 1 && !options.out.empty()) return Tr("--out takes a recipe with one output.");
   const std::string prefix = options.prefix.empty() ? std::string() : options.prefix.back();
   if (prefix.size() > kLongestPrefix) {
-    return "The prefix is longer than " + std::to_string(kLongestPrefix) + " characters.";
+    return Tr("The prefix is longer than %1 characters.", kLongestPrefix);
   }
-  if (!IsPlainName(prefix)) return "The prefix is a part of a name and cannot lead to a folder.";
-  if (options.keepTree && options.dest.empty()) return "--keep-tree needs --dest.";
-  if (options.overwrite == "ask" && !context.MayAsk()) return "--overwrite ask needs a terminal to ask on.";
+  if (!IsPlainName(prefix)) return Tr("The prefix must be part of a file name, not a path.");
+  if (options.keepTree && options.dest.empty()) return Tr("--keep-tree needs --dest.");
+  if (options.overwrite == "ask" && !context.MayAsk()) return Tr("--overwrite ask needs a terminal.");
   if (!options.dest.empty() && platform::FileExists(options.dest) && !platform::IsFolder(options.dest)) {
-    return "\"" + options.dest + "\" is not a folder.";
+    return Tr("\"%1\" is not a folder.", options.dest);
   }
   return {};
 }
@@ -145,7 +143,7 @@ int RunConvert(const ConvertOptions& options, const CommandContext& context) {
   if (const std::string wrong = TakeRecipe(options, recipe, job, function); !wrong.empty()) return UsageError(context, wrong);
   const auto files = SelectFiles(options.selection, context);
   if (!files) return kExitUsage;
-  if (!options.out.empty() && files->size() != 1) return UsageError(context, "--out takes exactly one picture.");
+  if (!options.out.empty() && files->size() != 1) return UsageError(context, Tr("--out takes exactly one picture."));
   if (options.quality > 0) job.encode.jpegQuality = job.encode.webpQuality = options.quality;
 
   ResultOutput output(context, options.json);
@@ -156,7 +154,7 @@ int RunConvert(const ConvertOptions& options, const CommandContext& context) {
   TerminalBox box(output, options.verbose, options.overwrite.empty() && !job.overwrite.prompt);
   job.box = &box;
   if (const Status status = RunBatch(*files, function, job); status != Status::Ok) {
-    output.Message(output.ShownMessage(options.dest) + ": " + std::string(StatusMessage(status)));
+    output.Message(output.ShownMessage(options.dest) + ": " + Tr(StatusMessage(status)));
     return kExitFailed;
   }
   return FinishBatch(job);
@@ -168,27 +166,28 @@ namespace {
 
 void SetUp(CLI::App& app, CommandContext& context, const std::shared_ptr<ConvertOptions>& options) {
   AddSelection(app, options->selection, context);
-  AddName(app, "-t,--to", options->to, "EXT", "Format to convert to, by its extension");
-  CLI::Option* dest = AddName(app, "-d,--dest", options->dest, "DIR",
-                              "Folder of the outputs, made with its parents; else they lie beside their sources");
-  CLI::Option* out = AddName(app, "-o,--out", options->out, "FILE", "Name of the output, for one picture");
+  AddName(app, "-t,--to", options->to, "EXT", "Output format, by extension");
+  CLI::Option* dest =
+      AddName(app, "-d,--dest", options->dest, "DIR", "Output folder, created if needed (default: beside each source)");
+  CLI::Option* out = AddName(app, "-o,--out", options->out, "FILE", "Output file, for a single picture");
   Exclude(out, dest);
-  Exclude(AddRepeatedText(app, "--prefix", options->prefix, "TEXT", "Put in front of every name"), out);
+  Exclude(AddRepeatedText(app, "--prefix", options->prefix, "TEXT", "Prefix for output names"), out);
   CLI::Option* steps = AddText(app, "--do", options->steps, "TEXT", "Operations to apply, separated by \";\": 'resize 50%; sharpen 0.5'");
   Exclude(AddName(app, "--recipe", options->recipe, "FILE|NAME", "Recipe to apply (see \"fotomill recipe list\")"), steps);
-  AddChoice(app, "--overwrite", options->overwrite, "HOW", {"ask", "replace", "keep-both", "skip"},
-            "ask (the way on a terminal), replace, keep-both (elsewhere) or skip files of an output's name");
-  AddFlag(app, "--keep-tree", options->keepTree, "Rebuild the folders of named folders in --dest");
-  AddFlag(app, "--keep-times", options->keepTimes, "Give outputs the times of their sources");
-  AddChoice(app, "--metadata", options->metadata, "HOW", {"keep", "strip"}, "Keep or strip EXIF, XMP and color profiles");
-  AddFlag(app, "--auto-orient", options->autoOrient, "Turn pictures upright as their EXIF says");
-  AddFlag(app, "--reduce", options->reduce, "Reduce the colors of pictures that are too deep for the format");
-  AddNumber(app, "--quality", options->quality, "N", 1, 100, "Of JPEG and WebP, 1 to 100");
-  AddNumber(app, "--page", options->page, "N", 1, INT32_MAX, "Page to take of files with several, from 1");
-  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, INT32_MAX, "Pictures at work at a time; 0, the default, is one a core");
-  AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would be done");
-  AddFlag(app, "-v,--verbose", options->verbose, "Say when a format cannot hold a picture's metadata");
-  AddFlag(app, "--json", options->json, "One JSON array of {file, destination, status, message}");
+  AddChoice(app, "--overwrite", options->overwrite, "HOW",
+            "If the output exists: ask (default on a terminal), replace, keep-both (default otherwise) or skip",
+            {"ask", "replace", "keep-both", "skip"});
+  AddFlag(app, "--keep-tree", options->keepTree, "Recreate the source folders in --dest");
+  AddFlag(app, "--keep-times", options->keepTimes, "Keep the modification times of the sources");
+  AddChoice(app, "--metadata", options->metadata, "HOW", "Keep (default) or strip EXIF, XMP and color profiles", {"keep", "strip"});
+  AddFlag(app, "--auto-orient", options->autoOrient, "Rotate pictures upright by EXIF orientation");
+  AddFlag(app, "--reduce", options->reduce, "Reduce colors if the format supports fewer");
+  AddNumber(app, "--quality", options->quality, "N", 1, 100, "JPEG and WebP quality, 1 to 100");
+  AddNumber(app, "--page", options->page, "N", 1, INT32_MAX, "Page to convert, from 1");
+  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, INT32_MAX, "Number of parallel jobs (default: 0, one per core)");
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be done");
+  AddFlag(app, "-v,--verbose", options->verbose, "Report metadata that the format cannot store");
+  AddFlag(app, "--json", options->json, "Print a JSON array of {file, destination, status, message}");
   context.run = [options, &context] { return RunConvert(*options, context); };
 }
 
@@ -196,7 +195,7 @@ void SetUp(CLI::App& app, CommandContext& context, const std::shared_ptr<Convert
 
 void SetUpConvert(CLI::App& app, CommandContext& context) {
   SetUp(app, context, std::make_shared<ConvertOptions>());
-  SetFooter(app, "Example: fotomill convert holiday -r --to png --dest out --keep-tree");
+  SetFooter(app, nullptr, "fotomill convert holiday -r --to png --dest out --keep-tree");
 }
 
 void SetUpApply(CLI::App& app, CommandContext& context) {
@@ -205,8 +204,8 @@ void SetUpApply(CLI::App& app, CommandContext& context) {
   SetUp(app, context, options);
   SetFooter(app,
             "Without --to and without \"save\" in the recipe, each output has the format of its source. \"fotomill operations\" lists\n"
-            "the operations, \"fotomill operations NAME\" explains one.\n\n"
-            "Example: fotomill apply holiday --do 'resize 1600x1600 only=shrink; sharpen 0.5' --to jpg --dest out");
+            "the operations, \"fotomill operations NAME\" explains one.",
+            "fotomill apply holiday --do 'resize 1600x1600 only=shrink; sharpen 0.5' --to jpg --dest out");
 }
 
 }  // namespace fotomill::cli

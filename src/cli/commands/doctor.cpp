@@ -18,36 +18,37 @@
 #include "plugins/plugin_table.h"
 #include "registry/registry.h"
 #include "settings/configuration.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
 namespace {
 
-void Tell(ResultOutput& output, std::string_view label, std::string_view fact) {
-  std::string line(label);
-  line.append(line.size() < 16 ? 16 - line.size() : 1, ' ');
-  output.Line(line + EscapeControls(fact));
+void Report(ResultOutput& output, std::string_view label, std::string_view fact) {
+  constexpr size_t kColumn = 16;
+  const size_t width = CharacterCount(label);
+  output.Line(std::string(label).append(width < kColumn ? kColumn - width : 1, ' ') + EscapeControls(fact));
 }
 
 std::string FolderFact(const std::string& folder) {
-  if (folder.empty()) return "none";
+  if (folder.empty()) return Tr("none");
   if (platform::IsFolder(folder)) return folder;
-  return folder + (platform::FileExists(folder) ? " (not a folder)" : " (not there yet)");
+  return platform::FileExists(folder) ? Tr("%1 (not a folder)", folder) : Tr("%1 (does not exist yet)", folder);
 }
 
-void TellConfiguration(ResultOutput& output) {
-  Tell(output, "Data folder", FolderFact(DataFolder()));
-  std::string state;
+void ReportConfiguration(ResultOutput& output) {
+  Report(output, Tr("Data folder"), FolderFact(DataFolder()));
+  std::string path = ConfigurationPath();
   switch (StateOfConfiguration()) {
     case ConfigurationState::NotLoaded:
-    case ConfigurationState::Missing: state = " (not there: the defaults are in force)"; break;
-    case ConfigurationState::Unreadable: state = " (cannot be read: the defaults are in force, and nothing will be saved)"; break;
+    case ConfigurationState::Missing: path = Tr("%1 (does not exist; the defaults apply)", path); break;
+    case ConfigurationState::Unreadable: path = Tr("%1 (cannot be read; the defaults apply and nothing is saved)", path); break;
     case ConfigurationState::Loaded: break;
   }
-  Tell(output, "Configuration", ConfigurationPath() + state);
+  Report(output, Tr("Configuration"), path);
   for (const ValueComplaint& complaint : ConfigurationComplaints()) {
-    Tell(output, "  line " + std::to_string(complaint.line),
-         std::string(complaint.row->name) + "=" + complaint.value + ": " + FaultMessage(*complaint.row, complaint.fault));
+    Report(output, "  " + Tr("line %1", complaint.line),
+           std::string(complaint.row->name) + "=" + complaint.value + ": " + FaultMessage(*complaint.row, complaint.fault));
   }
 }
 
@@ -58,27 +59,28 @@ bool IsRegistered(const std::string& path) {
   return false;
 }
 
-// The formats of each module, and the modules that gave none.
-void TellPlugins(ResultOutput& output, bool wanted) {
-  const std::string folder = platform::JoinFolder(platform::ProgramFolder(), "plugin");
-  Tell(output, "Plug-in folder", FolderFact(folder) + (wanted ? "" : " (switched off by --no-plugins)"));
-  if (!wanted) return;
+// The formats of each module, and the modules without one.
+void ReportPlugins(ResultOutput& output, bool enabled) {
+  const std::string folder = FolderFact(platform::JoinFolder(platform::ProgramFolder(), "plugin"));
+  Report(output, Tr("Plug-in folder"), enabled ? folder : Tr("%1 (disabled by --no-plugins)", folder));
+  if (!enabled) return;
   (void)ScanPlugins();
   std::map<std::string, std::string> formats;
   for (int32_t i = 0; i < PluginFormatCount(); ++i) {
     std::string& list = formats[std::string(PluginRow(i).path)];
     list += (list.empty() ? "" : " ") + UpperCase(PluginRow(i).extension);
   }
-  for (const auto& [path, list] : formats) Tell(output, "  " + EscapeControls(platform::FileNameOf(path)), list);
-  for (const platform::FolderEntry& entry : platform::ListFolder(folder).value_or(std::vector<platform::FolderEntry>())) {
+  for (const auto& [path, list] : formats) Report(output, "  " + EscapeControls(platform::FileNameOf(path)), list);
+  const std::string modules = platform::JoinFolder(platform::ProgramFolder(), "plugin");
+  for (const platform::FolderEntry& entry : platform::ListFolder(modules).value_or(std::vector<platform::FolderEntry>())) {
     const bool module = UpperCase(entry.name).starts_with("FMWPL") && entry.name.ends_with(platform::kModuleExtension);
-    if (module && !IsRegistered(platform::JoinFolder(folder, entry.name))) {
-      Tell(output, "  " + EscapeControls(entry.name), "not used: no module of this system, or it refuses to work here");
+    if (module && !IsRegistered(platform::JoinFolder(modules, entry.name))) {
+      Report(output, "  " + EscapeControls(entry.name), Tr("not used: not a module for this system, or it failed to start"));
     }
   }
 }
 
-void TellFormats(ResultOutput& output) {
+void ReportFormats(ResultOutput& output) {
   int readable = 0, writable = 0;
   std::string off;
   std::map<std::string, std::string> reasons;  // sentence, extensions
@@ -88,32 +90,32 @@ void TellFormats(ResultOutput& output) {
     writable += CanWrite(row) ? 1 : 0;
     const std::string extension = " " + std::string(row.extension);
     if (row.enabled == 0) off += extension;
-    if (!WhyNot(row).empty()) reasons[std::string(WhyNot(row))] += extension;
+    if (!WhyNot(row).empty()) reasons[Tr(WhyNot(row))] += extension;
   }
-  Tell(output, "Formats", std::to_string(readable) + " can be read, " + std::to_string(writable) + " written");
-  if (!off.empty()) output.Line("  Switched off:" + off);
+  Report(output, Tr("Formats"), Tr("%1 can be read, %2 can be written", readable, writable));
+  if (!off.empty()) output.Line(std::string("  ") + Tr("Disabled:") + off);
   for (const auto& [reason, extensions] : reasons) output.Line("  " + reason.substr(0, reason.size() - 1) + ":" + extensions);
 }
 
 int RunDoctor(const CommandContext& context) {
   ResultOutput output(context, false);
-  Tell(output, "Version", FOTOMILL_VERSION);
-  Tell(output, "Program", platform::ProgramPath());
-  TellConfiguration(output);
-  Tell(output, "Working files", FolderFact(platform::SpecialFolderPath(platform::SpecialFolder::Temporary)));
-  Tell(output, "Cores", std::to_string(platform::CoreCount()));
-  TellPlugins(output, !context.global.noPlugins);
+  Report(output, Tr("Version"), FOTOMILL_VERSION);
+  Report(output, Tr("Program"), platform::ProgramPath());
+  ReportConfiguration(output);
+  Report(output, Tr("Temporary files"), FolderFact(platform::SpecialFolderPath(platform::SpecialFolder::Temporary)));
+  Report(output, Tr("Cores"), std::to_string(platform::CoreCount()));
+  ReportPlugins(output, !context.global.noPlugins);
   for (const Library& library : Libraries()) {
-    Tell(output, "Library", std::string(library.name) + " " + library.version + ", for " + library.purpose);
+    Report(output, Tr("Library"), Tr("%1 %2, for %3", library.name, library.version, Tr(library.purpose)));
   }
-  TellFormats(output);
+  ReportFormats(output);
   return kExitOk;
 }
 
 }  // namespace
 
 void SetUpDoctor(CLI::App& app, CommandContext& context) {
-  SetFooter(app, "Example: fotomill doctor");
+  SetFooter(app, nullptr, "fotomill doctor");
   context.run = [&context] { return RunDoctor(context); };
 }
 

@@ -16,6 +16,7 @@
 #include "platform/files.h"
 #include "platform/output_file.h"
 #include "settings/job_options.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
@@ -24,8 +25,8 @@ namespace {
 struct ExifOptions {
   SelectionOptions selection;
   bool json = false;
-  std::string thumbnail;              // file for the embedded thumbnail; empty: not asked for
-  std::string overwrite = "refuse";   // what becomes of one that is there
+  std::string thumbnail;              // file for the embedded thumbnail; empty: not extracted
+  std::string overwrite = "refuse";   // or "replace", for that file
   std::vector<std::string> distance;  // two places, or none
 };
 
@@ -48,20 +49,20 @@ class JsonLines : public ExifSink {
   Json directories_ = Json::array();
 };
 
-// What became of one file.
+// The result for one file.
 struct Outcome {
   Status status = Status::Ok;
-  std::string hint;  // behind the message
-  std::string name;  // of the file that the message is about, the picture's own when empty
+  std::string hint;  // follows the message
+  std::string name;  // the file that the message is about; empty: the picture
   bool hasExif = false;
-  bool cutShort = false;  // there is more of it than a walk takes
+  bool cutShort = false;  // it has more entries than are shown
 };
 
 Outcome WriteThumbnail(std::span<const uint8_t> bytes, const ExifOptions& options) {
   const std::string& path = options.thumbnail;
-  if (bytes.empty()) return {Status::NoImages, "There is no embedded thumbnail.", {}};
+  if (bytes.empty()) return {Status::NoImages, Tr("This file has no embedded thumbnail."), {}};
   const bool replace = options.overwrite == "replace";
-  const std::string taken = "There is a file of that name; \"--overwrite replace\" takes its place.";
+  const std::string taken = Tr("The file exists; use --overwrite replace to replace it.");
   if (!replace && platform::FileExists(path)) return {Status::ErrorCreatingFile, taken, path};
   platform::OutputFile file;
   if (!file.Create(path)) return {Status::ErrorCreatingFile, {}, path};
@@ -74,7 +75,7 @@ Outcome WriteThumbnail(std::span<const uint8_t> bytes, const ExifOptions& option
   return {Status::ErrorWritingFile, {}, path};
 }
 
-// Walks the EXIF of one file into `sink` and writes its thumbnail where that is asked for.
+// Walks the EXIF of one file into `sink` and writes its thumbnail if asked to.
 Outcome WalkFile(const SelectedFile& file, const ExifOptions& options, ExifSink& sink) {
   if (file.status != Status::Ok) return {file.status, file.hint, {}};
   ExifSource source;
@@ -82,13 +83,13 @@ Outcome WalkFile(const SelectedFile& file, const ExifOptions& options, ExifSink&
   const auto block = source.Block();
   ExifFindings findings;
   if (!block.empty() && !WalkExif(block, &sink, &findings)) {
-    return {Status::DamagedFile, "The EXIF block does not begin as one.", {}};
+    return {Status::DamagedFile, Tr("The EXIF block has no valid header."), {}};
   }
   Outcome outcome;
   if (!options.thumbnail.empty()) outcome = WriteThumbnail(ExifThumbnail(block, findings), options);
   outcome.hasExif = !block.empty();
   outcome.cutShort = findings.cutShort;
-  if (!source.Intact()) return {Status::FileReadError, "The file became shorter meanwhile.", {}};
+  if (!source.Intact()) return {Status::FileReadError, Tr("The file was truncated while it was read."), {}};
   return outcome;
 }
 
@@ -107,9 +108,9 @@ class ExifRun {
       output_.CountFile();
       used_.Add(file.name);
       if (!outcome.hasExif && !options_.json) {
-        output_.Note(output_.ShownMessage(file.name) + ": There is no EXIF in this file.");
+        output_.Note(output_.ShownMessage(file.name) + ": " + Tr("This file has no EXIF."));
       }
-      if (outcome.cutShort) output_.Note(output_.ShownMessage(file.name) + ": There is more EXIF than is shown here.");
+      if (outcome.cutShort) output_.Note(output_.ShownMessage(file.name) + ": " + Tr("Not all EXIF entries are shown."));
     }
   }
 
@@ -122,7 +123,7 @@ class ExifRun {
     }
     char text[64];
     std::snprintf(text, sizeof text, "%.3f ", distance);
-    output_.Line(std::string(text).append(DistanceUnitName(unit)));
+    output_.Line(text + Tr(DistanceUnitName(unit)));
   }
 
   int Finish() { return output_.Finish(); }
@@ -139,7 +140,7 @@ class ExifRun {
     return outcome;
   }
 
-  // The lines of one file in one piece, so that they cost one write; of several files, each under its name.
+  // The lines of one file, in a single write; with several files, the name comes first.
   Outcome ReportLines(const SelectedFile& file, bool named) {
     lines_.Clear();
     Outcome outcome = WalkFile(file, options_, lines_);
@@ -183,16 +184,16 @@ int RunExif(const ExifOptions& options, const CommandContext& context) {
   const bool measures = !options.distance.empty();
   for (size_t i = 0; i < options.distance.size(); ++i) {
     if (!ReadPlace(options.distance[i], degrees + 2 * i)) {
-      return UsageError(context, "\"" + options.distance[i] + "\" is no LAT,LON in decimal degrees.");
+      return UsageError(context, Tr("\"%1\" is not LAT,LON in decimal degrees.", options.distance[i]));
     }
   }
   const bool alone = measures && context.names.values.empty() && options.selection.filesFrom.empty();
   const auto files = alone ? std::vector<SelectedFile>{} : SelectFiles(options.selection, context);
   if (!files) return kExitUsage;
   if (!options.thumbnail.empty()) {
-    if (files->size() != 1) return UsageError(context, "--thumbnail takes the thumbnail of one file.");
+    if (files->size() != 1) return UsageError(context, Tr("--thumbnail takes exactly one picture."));
     if (IsSameFile(files->front().name, options.thumbnail)) {
-      return UsageError(context, "--thumbnail names the picture itself.");
+      return UsageError(context, Tr("--thumbnail names the picture itself."));
     }
   }
   ExifRun run(options, context);
@@ -206,16 +207,14 @@ int RunExif(const ExifOptions& options, const CommandContext& context) {
 void SetUpExif(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<ExifOptions>();
   AddSelection(app, options->selection, context);
-  AddFlag(app, "--json", options->json, "One JSON array, an object for each file");
-  AddName(app, "--thumbnail", options->thumbnail, "OUT", "Write the embedded thumbnail to this file, as it is");
-  AddChoice(app, "--overwrite", options->overwrite, "HOW", {"refuse", "replace"},
-            "When OUT is there: refuse (the default) or replace");
+  AddFlag(app, "--json", options->json, "Print a JSON array with one object per file");
+  AddName(app, "--thumbnail", options->thumbnail, "OUT", "Extract the embedded thumbnail to this file, unchanged");
+  AddChoice(app, "--overwrite", options->overwrite, "HOW", "If the output exists: refuse (default) or replace",
+            {"refuse", "replace"});
   AddTexts(app, "--distance", options->distance, 2, "LAT,LON LAT,LON",
-           "Tell how far two places in decimal degrees are apart, in the unit that ExifDistinceUnits chooses");
-  SetFooter(app,
-            "Reads JPEG, TIFF, HD Photo, PNG and WebP files and bare EXIF blocks; several files each have their name on a "
-            "line above.\n\n"
-            "Example: fotomill exif photo.jpg --thumbnail small.jpg");
+           "Print the distance between two places in decimal degrees; ExifDistinceUnits sets the unit");
+  SetFooter(app, "Reads JPEG, TIFF, HD Photo, PNG and WebP files and bare EXIF blocks.",
+            "fotomill exif photo.jpg --thumbnail small.jpg");
   context.run = [options, &context] { return RunExif(*options, context); };
 }
 

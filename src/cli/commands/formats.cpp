@@ -8,6 +8,7 @@
 #include "core/shown_text.h"
 #include "core/text.h"
 #include "registry/registry.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
@@ -43,7 +44,7 @@ std::string RowAsText(int32_t index) {
   std::snprintf(front, sizeof front, "%2d  %-6.6s  %-5s %-5s  ", index, row.extension.c_str(), CanRead(row) ? "read" : "",
                 CanWrite(row) ? "write" : "");
   std::string line = EscapeControls(front) + EscapeControls(row.description);
-  if (row.enabled == 0) line += " (switched off)";
+  if (row.enabled == 0) line += std::string(" ") + Tr("(disabled)");
   return line;
 }
 
@@ -78,14 +79,14 @@ int RunFormats(const FormatsOptions& options, const CommandContext& context) {
 
 void SetUpFormats(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<FormatsOptions>();
-  CLI::Option* json = AddFlag(app, "--json", options->json, "One JSON array, an object for each row");
-  CLI::Option* destinations =
-      AddFlag(app, "--destinations", options->destinations, "The formats offered for writing, one a line");
-  CLI::Option* filter = AddFlag(app, "--filter", options->filter, "The open-file filter: description, tab, patterns");
+  CLI::Option* json = AddFlag(app, "--json", options->json, "Print a JSON array with one object per format");
+  CLI::Option* destinations = AddFlag(app, "--destinations", options->destinations, "List the output formats, one per line");
+  CLI::Option* filter =
+      AddFlag(app, "--filter", options->filter, "List the file filters of the Open dialog: description, tab, patterns");
   Exclude(destinations, json);
   Exclude(destinations, filter);
   Exclude(filter, json);
-  SetFooter(app, "Without an option: row, extension, what this build can do, description.\n\nExample: fotomill formats --json");
+  SetFooter(app, "Columns: index, extension, what this build can do, description.", "fotomill formats --json");
   context.run = [options, &context] { return RunFormats(*options, context); };
 }
 

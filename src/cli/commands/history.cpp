@@ -7,13 +7,14 @@
 #include "catalog/history/file_history.h"
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
-#include "core/nearest_name.h"
 #include "core/whole_number.h"
 #include "platform/clock.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "settings/job_options.h"
 #include "settings/settings.h"
+#include "texts/name_hint.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
@@ -27,14 +28,14 @@ struct HistoryOptions {
   bool dryRun = false;
 };
 
-constexpr std::string_view kNotRead =
-    "The file history is there but cannot be read as one, so it was left as it is; \"history clear\" removes it.";
-constexpr std::string_view kNotWritten = "The file history could not be written.";
+constexpr const char* kNotRead = TrLater("Not a readable file history; left unchanged. \"history clear\" deletes it.");
+constexpr const char* kNotWritten = TrLater("The file history could not be written.");
+constexpr const char* kOff = TrLater("The file history is disabled.");
 
-int Complain(const CommandContext& context, std::string_view message) {
+int Complain(const CommandContext& context, const char* message) {
   ResultOutput output(context, false);
   const std::string path = FileHistoryPath(HistoryOptionsFromSettings());
-  output.Note((path.empty() ? "fotomill" : output.ShownMessage(path)) + ": " + std::string(message));
+  output.Note((path.empty() ? "fotomill" : output.ShownMessage(path)) + ": " + Tr(message));
   return kExitFailed;
 }
 
@@ -67,12 +68,12 @@ int RunList(const HistoryOptions& options, const CommandContext& context) {
     output.Element(element);
   }
   ClearFileHistory();
-  if (settings.FileHistoryEnable == 0) output.Note("The file history is switched off.");
+  if (settings.FileHistoryEnable == 0) output.Note(Tr(kOff));
   const bool broken = !read && settings.FileHistoryEnable != 0 && !path.empty() && platform::FileExists(path);
   return broken ? Complain(context, kNotRead) : kExitOk;
 }
 
-// The function that a text names, by its name or its number; kNoFileFunction when it names none.
+// The function with this name or number; kNoFileFunction if there is none.
 int32_t FunctionOf(const std::string& text) {
   const auto number = ParseNumber<int32_t>(text);
   if (!number) return FileFunctionOfName(text);
@@ -82,7 +83,8 @@ int32_t FunctionOf(const std::string& text) {
 std::string UnknownFunction(const std::string& text) {
   std::vector<std::string_view> names;
   for (int32_t i = 0; i < kFileFunctionCount; ++i) names.push_back(FileFunctionName(i));
-  return "There is no function \"" + text + "\"; functions are 0 to 19 or their names." + NearestNameHint(text, names);
+  return Tr("Unknown function \"%1\"; use a number from 0 to %2 or a name.", text, kFileFunctionCount - 1) +
+         NearestNameHint(text, names);
 }
 
 int RunAdd(const HistoryOptions& options, const CommandContext& context) {
@@ -97,7 +99,7 @@ int RunAdd(const HistoryOptions& options, const CommandContext& context) {
     status = Status::FileOpenError;
   } else if (!FitsFileHistory(use.path)) {
     status = Status::InvalidDestination;
-    hint = "The file history holds paths of at most 260 bytes without tabs and line ends.";
+    hint = Tr("The file history takes paths of up to 260 bytes, without tabs and line breaks.");
   }
   if (status != Status::Ok) {
     output.Failure(name, status, hint);
@@ -105,17 +107,17 @@ int RunAdd(const HistoryOptions& options, const CommandContext& context) {
   }
   const std::string line = output.ShownMessage(name) + ": ";
   if (options.dryRun) {
-    output.Note(line + "would be recorded under " + std::string(FileFunctionName(function)) + ".");
+    output.Note(line + Tr("would be recorded as \"%1\".", FileFunctionName(function)));
     return kExitOk;
   }
   size_t recorded = 0;
   switch (UpdateFileHistory(HistoryOptionsFromSettings(), {&use, 1}, &recorded)) {
-    case HistoryUpdate::Off: output.Note("The file history is switched off."); return kExitOk;
+    case HistoryUpdate::Off: output.Note(Tr(kOff)); return kExitOk;
     case HistoryUpdate::NotRead: return Complain(context, kNotRead);
     case HistoryUpdate::Failed: return Complain(context, kNotWritten);
     case HistoryUpdate::Done: break;
   }
-  if (recorded == 0) output.Note(line + "not recorded, FileHistoryFunctions leaves this function out.");
+  if (recorded == 0) output.Note(line + Tr("not recorded; FileHistoryFunctions excludes this function."));
   return kExitOk;
 }
 
@@ -124,17 +126,17 @@ int RunClear(const HistoryOptions& options, const CommandContext& context) {
   ClearFileHistory();
   if (path.empty() || !platform::FileExists(path)) return kExitOk;
   if (options.dryRun) {
-    ResultOutput(context, false).Note(path + ": would be deleted.");
+    ResultOutput(context, false).Note(path + ": " + Tr("would be deleted."));
     return kExitOk;
   }
-  return platform::DeleteFile(path) ? kExitOk : Complain(context, "The file history could not be deleted.");
+  return platform::DeleteFile(path) ? kExitOk : Complain(context, TrLater("The file history could not be deleted."));
 }
 
 using Run = int (*)(const HistoryOptions& options, const CommandContext& context);
 
 std::shared_ptr<HistoryOptions> SetUp(CLI::App& app, CommandContext& context, Run run, const char* example) {
   auto options = std::make_shared<HistoryOptions>();
-  SetFooter(app, std::string("Example: ") + example);
+  SetFooter(app, nullptr, example);
   context.run = [options, &context, run] { return run(*options, context); };
   return options;
 }
@@ -143,24 +145,24 @@ std::shared_ptr<HistoryOptions> SetUp(CLI::App& app, CommandContext& context, Ru
 
 void SetUpHistoryList(CLI::App& app, CommandContext& context) {
   const auto options = SetUp(app, context, RunList, "fotomill history list --json");
-  AddFlag(app, "--json", options->json, "One JSON array of {path, function, functionName, created, accessed, size}");
+  AddFlag(app, "--json", options->json, "Print a JSON array of {path, function, functionName, created, accessed, size}");
 }
 
 void SetUpHistoryAdd(CLI::App& app, CommandContext& context) {
-  context.names.Declare("FILE", "The picture file that was used", 1, 1);
+  context.names.Declare("FILE", "The file that was used", 1, 1);
   const auto options = SetUp(app, context, RunAdd, "fotomill history add photo.jpg --function View");
   Require(AddName(app, "--function", options->function, "NAME|N",
-                  "What was done: a name such as \"Get info\", or a number from 0 to 19"));
+                  "What was done with it: a name such as \"Get info\", or a number from 0 to 19"));
   AddNumber(app, "--created", options->created, "SECONDS", INT32_MIN, INT32_MAX,
-            "When the file was made, in seconds since 1970 UTC; else its own time");
+            "When the file was created, in seconds since 1970 UTC (default: its own time)");
   AddNumber(app, "--accessed", options->accessed, "SECONDS", INT32_MIN, INT32_MAX,
-            "When it was used, in seconds since 1970 UTC; else now");
-  AddFlag(app, "-n,--dry-run", options->dryRun, "Only tell what would be recorded");
+            "When it was used, in seconds since 1970 UTC (default: now)");
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be recorded");
 }
 
 void SetUpHistoryClear(CLI::App& app, CommandContext& context) {
   const auto options = SetUp(app, context, RunClear, "fotomill history clear");
-  AddFlag(app, "-n,--dry-run", options->dryRun, "Only tell what would be deleted");
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be deleted");
 }
 
 }  // namespace fotomill::cli

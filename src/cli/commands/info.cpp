@@ -12,6 +12,7 @@
 #include "core/text.h"
 #include "registry/registry.h"
 #include "settings/job_options.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
@@ -28,7 +29,7 @@ std::string Resolution(double pixelsPerInch) {
   return text;
 }
 
-// How long each frame is to be shown, and how often all of them are, 0 for ever.
+// Frame durations and the number of rounds, 0 for endless.
 void AddFrames(const PictureRecord& picture, Json& facts) {
   AnimationPointer animation;
   if (picture.pageCount < 2 || OpenAnimation({.fileName = picture.fileName.c_str()}, animation) != Status::Ok) return;
@@ -59,26 +60,28 @@ Json FactsAsJson(const PictureRecord& picture) {
 }
 
 void AddFact(std::string& text, std::string_view label, std::string_view value) {
-  text.append(2, ' ').append(label).append(14 - label.size(), ' ').append(EscapeControls(value)).append(1, '\n');
+  constexpr size_t kColumn = 14;
+  const size_t width = CharacterCount(label);
+  text.append(2, ' ').append(label).append(width < kColumn ? kColumn - width : 1, ' ');
+  text.append(EscapeControls(value)).append(1, '\n');
 }
 
-// The lines of one file as one text, which leaves in one write.
+// The lines of one file as one text, for a single write.
 std::string FactsAsText(const PictureRecord& picture) {
   const FormatEntry& row = FormatRow(picture.formatIndex);
   std::string text;
-  AddFact(text, "Format", row.description.view());
-  if (!picture.typeName.empty()) AddFact(text, "Type", picture.typeName.view());
-  AddFact(text, "Dimensions", std::to_string(picture.width) + " x " + std::to_string(picture.height) + " pixels");
-  std::string depth = std::to_string(picture.bitsPerPixel) + (picture.bitsPerPixel == 1 ? " bit" : " bits");
-  if ((picture.alphaFlags & kHasAlpha) != 0) depth += " and alpha";
-  AddFact(text, "Depth", depth);
-  if (picture.pageCount > 1) AddFact(text, "Pages", std::to_string(picture.pageCount));
+  AddFact(text, Tr("Format"), row.description.view());
+  if (!picture.typeName.empty()) AddFact(text, Tr("Type"), picture.typeName.view());
+  AddFact(text, Tr("Dimensions"), Tr("%1 x %2 pixels", picture.width, picture.height));
+  const std::string depth = TrCount("%1 bit", "%1 bits", static_cast<uint64_t>(picture.bitsPerPixel));
+  AddFact(text, Tr("Depth"), (picture.alphaFlags & kHasAlpha) != 0 ? Tr("%1 and alpha", depth) : depth);
+  if (picture.pageCount > 1) AddFact(text, Tr("Pages"), std::to_string(picture.pageCount));
   if (picture.metadata.dpiX > 0 && picture.metadata.dpiY > 0) {
-    AddFact(text, "Resolution",
-            Resolution(picture.metadata.dpiX) + " x " + Resolution(picture.metadata.dpiY) + " pixels per inch");
+    AddFact(text, Tr("Resolution"),
+            Tr("%1 x %2 pixels per inch", Resolution(picture.metadata.dpiX), Resolution(picture.metadata.dpiY)));
   }
-  AddFact(text, "File size", WithThousands(picture.fileSize) + " bytes");
-  AddFact(text, "Image data", WithThousands(picture.imageBytes) + " bytes");
+  AddFact(text, Tr("File size"), TrCount("%1 byte", "%1 bytes", picture.fileSize));
+  AddFact(text, Tr("Image data"), TrCount("%1 byte", "%1 bytes", picture.imageBytes));
   for (size_t i = 0; i < picture.detailLines.Count(); ++i) {
     text.append(2, ' ').append(EscapeControls(picture.detailLines.Line(i))).append(1, '\n');
   }
@@ -136,8 +139,8 @@ int RunInfo(const InfoOptions& options, const CommandContext& context) {
 void SetUpInfo(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<InfoOptions>();
   AddSelection(app, options->selection, context);
-  AddFlag(app, "--json", options->json, "One JSON array, an object for each file");
-  SetFooter(app, "Example: fotomill info holiday --recursive --json");
+  AddFlag(app, "--json", options->json, "Print a JSON array with one object per file");
+  SetFooter(app, nullptr, "fotomill info holiday --recursive --json");
   context.run = [options, &context] { return RunInfo(*options, context); };
 }
 

@@ -9,6 +9,7 @@
 #include "core/text.h"
 #include "platform/paths.h"
 #include "registry/registry.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
@@ -18,11 +19,12 @@ struct MatchOptions {
   bool json = false;
 };
 
-// By which rule a row was found, for people who wonder why .pict is no PCT.
-std::string RuleOf(const std::string& name, const FormatEntry& row) {
-  const std::string extension = UpperCase(platform::ExtensionOf(name));
-  if (EqualIgnoringCase(extension, row.extension)) return "extension";
-  return "first three characters";
+// "EXT, DESCRIPTION, by its extension": the rule explains why .pict does not select PCT.
+std::string MatchText(const std::string& name, const FormatEntry& row) {
+  const std::string description = EscapeControls(row.description);
+  const bool whole = EqualIgnoringCase(platform::ExtensionOf(name), row.extension);
+  return whole ? Tr("%1, %2, by its extension", row.extension.view(), description)
+               : Tr("%1, %2, by its first three characters", row.extension.view(), description);
 }
 
 int RunMatch(const MatchOptions& options, const CommandContext& context) {
@@ -40,11 +42,9 @@ int RunMatch(const MatchOptions& options, const CommandContext& context) {
       PutName(element, "typeName", DescribeFileType(name));
       output.Element(element);
     } else if (index == kNoFormat) {
-      output.Line(output.Shown(name) + ": no format");
+      output.Line(output.Shown(name) + ": " + Tr("no format"));
     } else {
-      const FormatEntry& row = FormatRow(index);
-      output.Line(output.Shown(name) + ": " + extension + ", " + EscapeControls(row.description) + ", by its " +
-                  RuleOf(name, row));
+      output.Line(output.Shown(name) + ": " + MatchText(name, FormatRow(index)));
     }
   }
   return allMatch ? kExitOk : kExitFailed;
@@ -55,8 +55,8 @@ int RunMatch(const MatchOptions& options, const CommandContext& context) {
 void SetUpMatch(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<MatchOptions>();
   context.names.Declare("NAME...", "File names; they need not exist", 1);
-  AddFlag(app, "--json", options->json, "One JSON array of {name, index, extension, typeName}");
-  SetFooter(app, "The exit status is 1 when a name selects no format.\n\nExample: fotomill match scan.tiff photo.jpeg");
+  AddFlag(app, "--json", options->json, "Print a JSON array of {name, index, extension, typeName}");
+  SetFooter(app, "The exit status is 1 if a name selects no format.", "fotomill match scan.tiff photo.jpeg");
   context.run = [options, &context] { return RunMatch(*options, context); };
 }
 

@@ -6,10 +6,11 @@
 
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
-#include "core/nearest_name.h"
+#include "texts/name_hint.h"
 #include "operations/operations.h"
 #include "operations/recipe.h"
 #include "settings/key_texts.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
@@ -101,7 +102,7 @@ void Explain(const Operation& operation, ResultOutput& output) {
     output.Line(line);
   }
   output.Line("");
-  output.Line(std::string("Example: ") + operation.example);
+  output.Line(Tr("Example: %1", operation.example));
 }
 
 int RunOperations(bool json, const CommandContext& context) {
@@ -111,7 +112,7 @@ int RunOperations(bool json, const CommandContext& context) {
     one = FindOperation(name);
     std::vector<std::string_view> names;
     for (const Operation* operation : Operations()) names.emplace_back(operation->name);
-    if (one == nullptr) return UsageError(context, "There is no operation \"" + name + "\"." + NearestNameHint(name, names));
+    if (one == nullptr) return UsageError(context, Tr("Unknown operation \"%1\".", name) + NearestNameHint(name, names));
   }
   ResultOutput output(context, json);
   if (one != nullptr && !json) {
@@ -139,8 +140,8 @@ int RunOperations(bool json, const CommandContext& context) {
 void SetUpOperations(CLI::App& app, CommandContext& context) {
   auto json = std::make_shared<bool>(false);
   context.names.Declare("[NAME]", "Operation to explain (default: list all)", 0, 1);
-  AddFlag(app, "--json", *json, "One JSON array, an element for each operation with its parameters");
-  SetFooter(app, "Example: fotomill operations resize");
+  AddFlag(app, "--json", *json, "Print a JSON array of the operations and their parameters");
+  SetFooter(app, nullptr, "fotomill operations resize");
   context.run = [json, &context] { return RunOperations(*json, context); };
 }
 

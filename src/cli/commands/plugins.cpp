@@ -5,6 +5,7 @@
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
 #include "plugins/plugin_table.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
@@ -40,7 +41,7 @@ int RunPlugins(const PluginsOptions& options, const CommandContext& context) {
                   output.Shown(entry.path));
     }
   }
-  if (PluginFormatCount() == 0) output.Note("No plug-ins are loaded.");
+  if (PluginFormatCount() == 0) output.Note(Tr("No plug-ins are loaded."));
   return kExitOk;
 }
 
@@ -48,8 +49,9 @@ int RunPlugins(const PluginsOptions& options, const CommandContext& context) {
 
 void SetUpPlugins(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<PluginsOptions>();
-  AddFlag(app, "--json", options->json, "One JSON array: {path, extension, textA, textB, flags1, flags2, canRead, canWrite}");
-  SetFooter(app, "Modules lie in the folder \"plugin\" beside the program.\nExample: fotomill plugins --json");
+  AddFlag(app, "--json", options->json,
+          "Print a JSON array of {path, extension, textA, textB, flags1, flags2, canRead, canWrite}");
+  SetFooter(app, "Modules are loaded from the folder \"plugin\" beside the program.", "fotomill plugins --json");
   context.run = [options, &context] { return RunPlugins(*options, context); };
 }
 

@@ -8,6 +8,7 @@
 #include "operations/recipe.h"
 #include "operations/recipe_library.h"
 #include "settings/key_texts.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
@@ -41,7 +42,7 @@ int RunList(bool json, const CommandContext& context) {
     }
     std::string line = output.Shown(named.name) + "\t";
     for (const std::string& name : names) line.append(&name == &names[0] ? "" : ", ").append(name);
-    output.Line(right ? line : line + "(has mistakes)");
+    output.Line(right ? line : line + Tr("(has mistakes)"));
   }
   return kExitOk;
 }
@@ -92,25 +93,25 @@ int RunCheck(bool json, const CommandContext& context) {
 
 void SetUpRecipeList(CLI::App& app, CommandContext& context) {
   auto json = std::make_shared<bool>(false);
-  AddFlag(app, "--json", *json, "One JSON array of {name, path, operations}");
-  SetFooter(app, "Recipes are the files NAME.recipe in the folder \"recipes\" of the data folder, and six built-in ones.\n\n"
-                 "Example: fotomill recipe list");
+  AddFlag(app, "--json", *json, "Print a JSON array of {name, path, operations}");
+  SetFooter(app, "Recipes are the files NAME.recipe in the folder \"recipes\" of the data folder, and six built-in ones.",
+            "fotomill recipe list");
   context.run = [json, &context] { return RunList(*json, context); };
 }
 
 void SetUpRecipeShow(CLI::App& app, CommandContext& context) {
   auto json = std::make_shared<bool>(false);
   context.names.Declare("FILE|NAME", "Recipe to print", 1, 1);
-  AddFlag(app, "--json", *json, "One JSON array of {name, path, text}");
-  SetFooter(app, "Example: fotomill recipe show web");
+  AddFlag(app, "--json", *json, "Print a JSON array of {name, path, text}");
+  SetFooter(app, nullptr, "fotomill recipe show web");
   context.run = [json, &context] { return RunShow(*json, context); };
 }
 
 void SetUpRecipeCheck(CLI::App& app, CommandContext& context) {
   auto json = std::make_shared<bool>(false);
   context.names.Declare("FILE...", "Recipes to check", 1);
-  AddFlag(app, "--json", *json, "One JSON array of {line, operation, parameter, message}");
-  SetFooter(app, "The exit status is 2 when a recipe has mistakes.\n\nExample: fotomill recipe check holiday.recipe");
+  AddFlag(app, "--json", *json, "Print a JSON array of {line, operation, parameter, message}");
+  SetFooter(app, "The exit status is 2 if a recipe has mistakes.", "fotomill recipe check holiday.recipe");
   context.run = [json, &context] { return RunCheck(*json, context); };
 }
 

@@ -12,6 +12,7 @@
 #include "cli/frame/result_output.h"
 #include "cli/frame/terminal_box.h"
 #include "platform/folders.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
@@ -19,8 +20,8 @@ namespace {
 
 struct RenameCommandOptions {
   SelectionOptions selection;
-  int32_t digits = 0;  // 0: as usual
-  int32_t seed = -1;   // -1: another one each time
+  int32_t digits = 0;  // 0: the default
+  int32_t seed = -1;   // -1: a new one each time
   bool undo = false;
   bool dryRun = false;
   bool json = false;
@@ -30,7 +31,7 @@ int RunUndo(const RenameCommandOptions& options, const std::vector<SelectedFile>
   std::set<std::string> only;
   for (const SelectedFile& file : files) only.insert(platform::AbsolutePath(file.name));
   if (UndoRename(only, options.dryRun, job)) return kExitOk;
-  output.Message("fotomill: What was renamed last is noted in the data folder but cannot be read.");
+  output.Message(std::string("fotomill: ") + Tr("The record of the last renaming in the data folder cannot be read."));
   return kExitFailed;
 }
 
@@ -63,15 +64,15 @@ int RunRenameCommand(const RenameCommandOptions& options, const CommandContext& 
 void SetUpRename(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<RenameCommandOptions>();
   AddSelection(app, options->selection, context);
-  AddFlag(app, "--undo", options->undo, "Give the files of the last run, or those of them that are named, their old names");
-  AddNumber(app, "--digits", options->digits, "N", 1, 10, "Digits of the numbers; 4 unless given");
-  AddNumber(app, "--seed", options->seed, "N", 0, INT32_MAX, "With SequentialRenameRandom: the same N, the same order");
-  AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would be done");
-  AddFlag(app, "--json", options->json, "One JSON array of {file, destination, status, message}");
+  AddFlag(app, "--undo", options->undo, "Undo the last renaming, of all files or of the named ones");
+  AddNumber(app, "--digits", options->digits, "N", 1, 10, "Digits of the numbers (default: 4)");
+  AddNumber(app, "--seed", options->seed, "N", 0, INT32_MAX, "Seed of SequentialRenameRandom: the same seed, the same order");
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be done");
+  AddFlag(app, "--json", options->json, "Print a JSON array of {file, destination, status, message}");
   SetFooter(app,
-            "The keys SequentialRenameBaseName, BaseNumber, Increment, MaxAttempts, Sep, Hyphen, Prefix, Random, SkipCollide "
-            "and Update say how files are named; all begin with SequentialRename.\n\n"
-            "Example: fotomill --set SequentialRenameBaseName=holiday- rename photos --dry-run");
+            "The names follow the configuration keys that begin with SequentialRename: BaseName, BaseNumber, Increment,\n"
+            "MaxAttempts, Sep, Hyphen, Prefix, Random, SkipCollide and Update.",
+            "fotomill --set SequentialRenameBaseName=holiday- rename photos --dry-run");
   context.run = [options, &context] { return RunRenameCommand(*options, context); };
 }
 

@@ -18,6 +18,7 @@
 #include "platform/folders.h"
 #include "platform/process.h"
 #include "settings/job_options.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
@@ -33,16 +34,18 @@ struct TdbOptions {
   bool json = false;
 };
 
-constexpr const char* kNoDatabase = "It is no thumbnail database that can be read, so it was left as it is.";
-constexpr const char* kNotAdded = "The thumbnail could not be added to the database.";
+constexpr const char* kNoDatabase = TrLater("Not a readable thumbnail database; left unchanged.");
+constexpr const char* kNotAdded = TrLater("The thumbnail could not be added to the database.");
+constexpr const char* kNotFound = TrLater("The database has no thumbnail of this picture.");
+constexpr const char* kExists = TrLater("The file exists; use --overwrite replace to replace it.");
 constexpr size_t kAddedAtOnce = 64;  // pictures, about 2 MB
 
-// Opens a database. False after a message.
+// Opens a database; false after a message.
 bool OpenDatabase(ThumbnailDatabase& database, const std::string& path, bool create, ResultOutput& output) {
   switch (database.OpenThumbnailDatabase(path, create, ThumbnailOptionsFromSettings().hidden)) {
     case ThumbnailDatabase::Opened::Done: return true;
     case ThumbnailDatabase::Opened::Missing: output.Failure(path, Status::FileOpenError); break;
-    case ThumbnailDatabase::Opened::NotRead: output.Failure(path, Status::DamagedFile, kNoDatabase); break;
+    case ThumbnailDatabase::Opened::NotRead: output.Failure(path, Status::DamagedFile, Tr(kNoDatabase)); break;
     case ThumbnailDatabase::Opened::Failed: output.Failure(path, Status::ErrorCreatingFile); break;
   }
   return false;
@@ -61,7 +64,7 @@ Adding MakeRecord(const SelectedFile& file, const ThumbnailOptions& options) {
   adding.record->path = platform::AbsolutePath(file.name);
   if (adding.record->path.size() > PathText::Capacity()) {
     adding.status = Status::InvalidDestination;
-    adding.hint = "Its path is longer than 260 characters.";
+    adding.hint = Tr("The path is longer than 260 characters.");
     return adding;
   }
   adding.status = MakeThumbnailOfFile(file.name, options, adding.record->thumbnail);
@@ -69,7 +72,7 @@ Adding MakeRecord(const SelectedFile& file, const ThumbnailOptions& options) {
   return adding;
 }
 
-// Appends records a few dozens at a time, as each time waits for the disk.
+// Appends records in blocks, since each append waits for the disk.
 class Appending {
  public:
   Appending(ThumbnailDatabase& database, ResultOutput& output) : database_(database), output_(output) {}
@@ -89,7 +92,7 @@ class Appending {
     const bool added = records_.empty() || database_.AppendDatabaseRecords(records_, true);
     for (const std::string& name : names_) {
       if (!added) {
-        output_.Failure(name, Status::ErrorWritingFile, kNotAdded);
+        output_.Failure(name, Status::ErrorWritingFile, Tr(kNotAdded));
         continue;
       }
       output_.CountFile();
@@ -167,11 +170,11 @@ int RunFind(const TdbOptions& options, CommandContext& context) {
   const std::string picture = platform::AbsolutePath(name);
   ThumbnailRecord record;
   if (!database.Find(picture, VolumeKeyFor(picture), record)) {
-    output.Failure(name, Status::NoImages, "The database has no thumbnail of it.");
+    output.Failure(name, Status::NoImages, Tr(kNotFound));
     return output.Finish();
   }
   if (options.overwrite != "replace" && platform::FileExists(options.out)) {
-    output.Failure(options.out, Status::ErrorCreatingFile, "The file is there; --overwrite replace replaces it.");
+    output.Failure(options.out, Status::ErrorCreatingFile, Tr(kExists));
     return output.Finish();
   }
   if (!WriteThumbnailFile(record, options.out, ThumbnailOptionsFromSettings().hidden)) {
@@ -206,12 +209,12 @@ int RunList(const TdbOptions& options, CommandContext& context) {
   DatabaseHeader header;
   if (!OpenDatabase(database, path, false, output)) return output.Finish();
   if (!database.ReadDatabaseHeader(header)) {
-    output.Failure(path, Status::DamagedFile, kNoDatabase);
+    output.Failure(path, Status::DamagedFile, Tr(kNoDatabase));
     return output.Finish();
   }
   if (header.count != database.RecordCount(header)) {
-    output.Note(output.ShownMessage(path) + ": Its header counts " + std::to_string(header.count) + " records, the file holds " +
-                std::to_string(database.RecordCount(header)) + ".");
+    output.Note(output.ShownMessage(path) + ": " +
+                Tr("The header counts %1 records, but the file has %2.", header.count, database.RecordCount(header)));
   }
   if (options.json) {
     PrintJson(context, database, header);
@@ -226,7 +229,7 @@ int RunList(const TdbOptions& options, CommandContext& context) {
   return kExitOk;
 }
 
-// How many records a test picks out.
+// The number of records that pass a test.
 template <typename Test>
 int64_t CountRecords(const ThumbnailDatabase& database, Test test) {
   DatabaseHeader header;
@@ -250,7 +253,7 @@ int RunDelete(const TdbOptions& options, CommandContext& context) {
                        : database.Delete(picture);
     if (deleted < 1) {
       output.Failure(name, deleted == 0 ? Status::NoImages : Status::ErrorWritingFile,
-                     deleted == 0 ? "The database has no thumbnail of it." : "");
+                     deleted == 0 ? Tr(kNotFound) : "");
       continue;
     }
     output.CountFile();
@@ -281,28 +284,28 @@ int RunCompact(const TdbOptions& options, CommandContext& context) {
     const int64_t kept = CountRecords(database, [&](const DatabaseKey& key) {
       return !key.deleted && !(options.purge && !platform::FileExists(key.path) && PurgesMissing(key));
     });
-    output.Line(std::to_string(before.count) + " -> " + std::to_string(kept) + " records");
+    output.Line(Tr("%1 -> %2 records", before.count, kept));
     return kExitOk;
   }
   CompactionProgress progress(output);
   const ThumbnailDatabase::Compacted result =
       read ? database.CompactThumbnailDatabase(options.purge, &progress) : ThumbnailDatabase::Compacted::NotRead;
   if (result == ThumbnailDatabase::Compacted::Done && database.ReadDatabaseHeader(after)) {
-    output.Line(std::to_string(before.count) + " -> " + std::to_string(after.count) + " records");
+    output.Line(Tr("%1 -> %2 records", before.count, after.count));
     return kExitOk;
   }
   const Status status = result == ThumbnailDatabase::Compacted::NotRead   ? Status::FileReadError
                         : result == ThumbnailDatabase::Compacted::Stopped ? Status::FunctionCancelled
                                                                           : Status::ErrorWritingFile;
-  output.Failure(path, status, "The database stays as it was.");
+  output.Failure(path, status, Tr("The database was left unchanged."));
   return kExitFailed;
 }
 
 using Run = int (*)(const TdbOptions& options, CommandContext& context);
 
-std::shared_ptr<TdbOptions> SetUp(CLI::App& app, CommandContext& context, Run run, const char* text) {
+std::shared_ptr<TdbOptions> SetUp(CLI::App& app, CommandContext& context, Run run, const char* notes, const char* example) {
   auto options = std::make_shared<TdbOptions>();
-  SetFooter(app, text);
+  SetFooter(app, notes, example);
   context.run = [options, &context, run] { return run(*options, context); };
   return options;
 }
@@ -311,43 +314,43 @@ std::shared_ptr<TdbOptions> SetUp(CLI::App& app, CommandContext& context, Run ru
 
 void SetUpTdbAdd(CLI::App& app, CommandContext& context) {
   const auto options = SetUp(app, context, RunAdd,
-                             "A database that is missing is made. A picture that is there already gets a new record, and the "
-                             "earlier one is marked deleted.\n\nExample: fotomill tdb add Fotomill.tdb holiday --recursive");
+                             TrLater("The database is created if needed. If it already has the picture, the earlier record is\n"
+                                     "marked as deleted."),
+                             "fotomill tdb add Fotomill.tdb holiday --recursive");
   AddSelection(app, options->selection, context);
-  context.names.Declare("DB FILE...", "The database, and pictures or folders of pictures", 1);
-  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, 256, "Pictures in work at once; 0, the default, is one a core");
-  AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would be added");
+  context.names.Declare("DB FILE...", "The database, and picture files or folders of pictures", 1);
+  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, 256, "Number of parallel jobs (default: 0, one per core)");
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be added");
 }
 
 void SetUpTdbFind(CLI::App& app, CommandContext& context) {
-  const auto options = SetUp(app, context, RunFind, "Example: fotomill tdb find Fotomill.tdb holiday/beach.jpg --out beach.THN");
-  context.names.Declare("DB PATH", "The database, and the picture whose thumbnail is wanted", 2, 2);
-  Require(AddName(app, "-o,--out", options->out, "FILE.THN", "The thumbnail file to write"));
-  AddChoice(app, "--overwrite", options->overwrite, "HOW", {"refuse", "replace"},
-            "When FILE.THN is there: refuse (the default) or replace");
+  const auto options = SetUp(app, context, RunFind, nullptr, "fotomill tdb find Fotomill.tdb holiday/beach.jpg --out beach.THN");
+  context.names.Declare("DB PATH", "The database, and the path of a picture", 2, 2);
+  Require(AddName(app, "-o,--out", options->out, "FILE.THN", "Thumbnail file to write"));
+  AddChoice(app, "--overwrite", options->overwrite, "HOW", "If the output exists: refuse (default) or replace",
+            {"refuse", "replace"});
 }
 
 void SetUpTdbList(CLI::App& app, CommandContext& context) {
-  const auto options = SetUp(app, context, RunList, "Example: fotomill tdb list Fotomill.tdb --json");
+  const auto options = SetUp(app, context, RunList, nullptr, "fotomill tdb list Fotomill.tdb --json");
   context.names.Declare("DB", "The database", 1, 1);
   AddFlag(app, "--json", options->json,
-          "One JSON object {version, count, created, appended, records: [{index, path, volume, deleted}]}");
+          "Print a JSON object {version, count, created, appended, records: [{index, path, volume, deleted}]}");
 }
 
 void SetUpTdbDelete(CLI::App& app, CommandContext& context) {
-  const auto options = SetUp(app, context, RunDelete,
-                             "Records are marked only; compact takes them out.\n\n"
-                             "Example: fotomill tdb delete Fotomill.tdb holiday/beach.jpg");
-  context.names.Declare("DB PATH...", "The database, and pictures whose thumbnails are to go", 2);
-  AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would be deleted");
+  const auto options = SetUp(app, context, RunDelete, TrLater("Records are only marked as deleted; \"tdb compact\" removes them."),
+                             "fotomill tdb delete Fotomill.tdb holiday/beach.jpg");
+  context.names.Declare("DB PATH...", "The database, and paths of pictures", 2);
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be deleted");
 }
 
 void SetUpTdbCompact(CLI::App& app, CommandContext& context) {
-  const auto options = SetUp(app, context, RunCompact, "Example: fotomill tdb compact Fotomill.tdb --purge");
+  const auto options = SetUp(app, context, RunCompact, nullptr, "fotomill tdb compact Fotomill.tdb --purge");
   context.names.Declare("DB", "The database", 1, 1);
   AddFlag(app, "--purge", options->purge,
-          "Drop thumbnails of missing pictures as well, except on network, optical and removable drives");
-  AddFlag(app, "-n,--dry-run", options->dryRun, "Only print how many records would stay");
+          "Also remove thumbnails of missing pictures, except on network, optical and removable drives");
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only show how many records would remain");
 }
 
 }  // namespace fotomill::cli

@@ -26,6 +26,7 @@
 #include "registry/registry.h"
 #include "settings/job_options.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
@@ -42,7 +43,7 @@ struct ThumbsOptions {
   bool json = false;
 };
 
-// What a picture's thumbnail file is worth.
+// The state of a picture's thumbnail file; the names are part of the output of "thumbs list".
 enum class ThumbnailState { Current, Stale, Missing, Broken };
 
 ThumbnailState StateOf(const std::string& picture) {
@@ -70,11 +71,11 @@ Status MakeThumbnail(const std::string& name, const ThumbnailOptions& options) {
   return WriteThumbnailFile(record, ThumbnailPathFor(name), options.hidden) ? Status::Ok : Status::ErrorCreatingFile;
 }
 
-// A file of the selection, and what became of it.
+// A selected file and its result.
 struct Making {
   Status status = Status::Ok;
-  bool wanted = false;           // it lacks a current thumbnail
-  std::vector<size_t> together;  // of the first of those that share a thumbnail file: all of them that are wanted, in order
+  bool wanted = false;           // it has no current thumbnail
+  std::vector<size_t> together;  // for the first file that uses a thumbnail file: all wanted files that use it, in order
 };
 
 std::vector<Making> PlanMaking(const std::vector<SelectedFile>& files, bool force) {
@@ -102,7 +103,7 @@ void ReportMaking(const SelectedFile& file, const Making& making, ResultOutput& 
   if (making.status != Status::Ok) {
     output.Failure(file.name, making.status, file.hint.empty() ? OpenHint(file.name, making.status) : file.hint);
   } else if (!made) {
-    output.Note(output.ShownMessage(file.name) + ": has a thumbnail.");
+    output.Note(output.ShownMessage(file.name) + ": " + Tr("already has a current thumbnail."));
   } else {
     output.CountFile();
     used.Add(file.name);
@@ -110,8 +111,7 @@ void ReportMaking(const SelectedFile& file, const Making& making, ResultOutput& 
   }
 }
 
-// On several threads; what is printed, and which of the pictures that share a thumbnail file has it in the end, is as if they
-// were made one after the other.
+// Runs on several threads, with the same output and the same thumbnail files as on one.
 int RunMake(const ThumbsOptions& options, const CommandContext& context) {
   const auto files = SelectFiles(options.selection, context);
   if (!files) return kExitUsage;
@@ -143,14 +143,14 @@ int RunMake(const ThumbsOptions& options, const CommandContext& context) {
   return output.Finish();
 }
 
-// Writes what a command drew; a file of that name stays unless it may be replaced.
+// Writes a picture; an existing file is kept unless --overwrite replace is given.
 int WriteDrawing(PictureRecord& picture, const std::string& name, const ThumbsOptions& options, ResultOutput& output) {
   WriteOptions write{.encode = EncodeOptionsFromSettings()};
   write.existing = options.overwrite == "replace" ? platform::Existing::Replace : platform::Existing::Refuse;
   const Status status = WritePicture(picture, options.out, write);
   if (status != Status::Ok) {
     const bool taken = write.existing == platform::Existing::Refuse && platform::FileExists(options.out);
-    output.Failure(options.out, status, taken ? "The file is there; --overwrite replace replaces it." : "");
+    output.Failure(options.out, status, taken ? Tr("The file exists; use --overwrite replace to replace it.") : "");
     return output.Finish();
   }
   output.CountFile();
@@ -167,7 +167,7 @@ int RunShow(const ThumbsOptions& options, const CommandContext& context) {
   };
   if (!platform::IsRegularFile(name)) return fail(name, Status::FileOpenError, {});
   ThumbnailRecord record;
-  if (!ReadThumbnailFile(record, name)) return fail(name, Status::DamagedFile, "It is no thumbnail file.");
+  if (!ReadThumbnailFile(record, name)) return fail(name, Status::DamagedFile, Tr("Not a thumbnail file."));
   const PicturePointer picture = NewPictureRecord(ReadOptionsFromSettings().alphaBackground);
   if (picture == nullptr) return fail(name, Status::MemoryAllocationError, {});
   if (const Status status = ThumbnailRecordToBitmap(record, picture->image); status != Status::Ok) return fail(name, status, {});
@@ -198,7 +198,7 @@ int RunDraw(const ThumbsOptions& options, const CommandContext& context) {
   return WriteDrawing(*picture, name, options, output);
 }
 
-// The pictures of a folder, or a failure of the whole command.
+// The pictures of a folder; nullopt if it cannot be read.
 std::optional<std::vector<std::string>> PicturesIn(const std::string& folder) {
   const auto entries = platform::ListFolder(folder);
   if (!entries) return std::nullopt;
@@ -211,7 +211,7 @@ std::optional<std::vector<std::string>> PicturesIn(const std::string& folder) {
 }
 
 int FailFolder(ResultOutput& output, const std::string& folder) {
-  output.Failure(folder, Status::FileOpenError, platform::FileExists(folder) ? "It is no folder that can be read." : "");
+  output.Failure(folder, Status::FileOpenError, platform::FileExists(folder) ? Tr("Not a readable folder.") : "");
   return output.Finish();
 }
 
@@ -247,7 +247,7 @@ int RunClean(const ThumbsOptions& options, const CommandContext& context) {
   for (const std::string& orphan : *orphans) {
     if (!output.GoesOn()) break;
     if (!options.dryRun && (optical || !platform::DeleteFile(orphan))) {
-      output.Failure(orphan, Status::ErrorWritingFile, "It could not be deleted.");
+      output.Failure(orphan, Status::ErrorWritingFile, Tr("It could not be deleted."));
       continue;
     }
     output.CountFile();
@@ -258,9 +258,9 @@ int RunClean(const ThumbsOptions& options, const CommandContext& context) {
 
 using Run = int (*)(const ThumbsOptions& options, const CommandContext& context);
 
-std::shared_ptr<ThumbsOptions> SetUp(CLI::App& app, CommandContext& context, Run run, const char* text) {
+std::shared_ptr<ThumbsOptions> SetUp(CLI::App& app, CommandContext& context, Run run, const char* notes, const char* example) {
   auto options = std::make_shared<ThumbsOptions>();
-  SetFooter(app, text);
+  SetFooter(app, notes, example);
   context.run = [options, &context, run] { return run(*options, context); };
   return options;
 }
@@ -269,47 +269,49 @@ std::shared_ptr<ThumbsOptions> SetUp(CLI::App& app, CommandContext& context, Run
 
 void SetUpThumbsMake(CLI::App& app, CommandContext& context) {
   const auto options = SetUp(app, context, RunMake,
-                             "A picture whose thumbnail file is as new as itself is left out. Pictures that differ in their "
-                             "extension only share a thumbnail file; the last one has it.\n\n"
-                             "Example: fotomill thumbs make holiday --recursive");
+                             TrLater("Pictures with a current thumbnail file are skipped. Pictures whose names differ only in the\n"
+                                     "extension share a thumbnail file; the last one written wins."),
+                             "fotomill thumbs make holiday --recursive");
   AddSelection(app, options->selection, context);
-  AddFlag(app, "--force", options->force, "Make thumbnails that are there and current again");
-  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, 256, "Pictures in work at once; 0, the default, is one a core");
-  AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would be made");
-  AddFlag(app, "--json", options->json, "One JSON array of {file, thumbnail, made, status, message}");
+  AddFlag(app, "--force", options->force, "Also recreate thumbnails that are current");
+  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, 256, "Number of parallel jobs (default: 0, one per core)");
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be done");
+  AddFlag(app, "--json", options->json, "Print a JSON array of {file, thumbnail, made, status, message}");
 }
 
 void SetUpThumbsShow(CLI::App& app, CommandContext& context) {
-  const auto options = SetUp(app, context, RunShow, "Example: fotomill thumbs show holiday/beach.THN --out beach.bmp");
+  const auto options = SetUp(app, context, RunShow, nullptr, "fotomill thumbs show holiday/beach.THN --out beach.bmp");
   context.names.Declare("FILE.THN", "The thumbnail file", 1, 1);
-  Require(AddName(app, "-o,--out", options->out, "FILE", "The picture to write, in the format of its extension"));
-  AddChoice(app, "--overwrite", options->overwrite, "HOW", {"refuse", "replace"},
-            "When FILE is there: refuse (the default) or replace");
+  Require(AddName(app, "-o,--out", options->out, "FILE", "Picture to write; its extension selects the format"));
+  AddChoice(app, "--overwrite", options->overwrite, "HOW", "If the output exists: refuse (default) or replace",
+            {"refuse", "replace"});
 }
 
 void SetUpThumbsDraw(CLI::App& app, CommandContext& context) {
   const auto options = SetUp(app, context, RunDraw,
-                             "The picture is turned upright by its EXIF. Programs that show folders call this for thumbnails "
-                             "of their own.\n\nExample: fotomill thumbs draw scan.pcx --side 128 --out scan.png");
+                             TrLater("The picture is rotated upright by EXIF orientation. File managers can use this command as a\n"
+                                     "thumbnailer."),
+                             "fotomill thumbs draw scan.pcx --side 128 --out scan.png");
   context.names.Declare("FILE", "The picture", 1, 1);
-  Require(AddName(app, "-o,--out", options->out, "FILE", "The picture to write, in the format of its extension"));
-  AddNumber(app, "--side", options->side, "N", 1, 4096, "Pixels of the longer side at most; 256 is the default");
-  AddChoice(app, "--overwrite", options->overwrite, "HOW", {"refuse", "replace"},
-            "When the file to write is there: refuse (the default) or replace");
+  Require(AddName(app, "-o,--out", options->out, "FILE", "Picture to write; its extension selects the format"));
+  AddNumber(app, "--side", options->side, "N", 1, 4096, "Longest side in pixels (default: 256)");
+  AddChoice(app, "--overwrite", options->overwrite, "HOW", "If the output exists: refuse (default) or replace",
+            {"refuse", "replace"});
 }
 
 void SetUpThumbsList(CLI::App& app, CommandContext& context) {
   const auto options = SetUp(app, context, RunList,
-                             "A thumbnail is current, stale (older than its picture), missing, broken, or an orphan (there is "
-                             "no picture of its name).\n\nExample: fotomill thumbs list holiday --json");
+                             TrLater("A thumbnail is current, stale (older than its picture), missing, broken, or an orphan\n"
+                                     "(without a picture)."),
+                             "fotomill thumbs list holiday --json");
   context.names.Declare("DIR", "A folder of pictures", 1, 1);
-  AddFlag(app, "--json", options->json, "One JSON array of {file, thumbnail, status}");
+  AddFlag(app, "--json", options->json, "Print a JSON array of {file, thumbnail, status}");
 }
 
 void SetUpThumbsClean(CLI::App& app, CommandContext& context) {
-  const auto options = SetUp(app, context, RunClean, "Example: fotomill thumbs clean holiday --dry-run");
+  const auto options = SetUp(app, context, RunClean, nullptr, "fotomill thumbs clean holiday --dry-run");
   context.names.Declare("DIR", "A folder of pictures", 1, 1);
-  AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would be deleted");
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be deleted");
 }
 
 }  // namespace fotomill::cli

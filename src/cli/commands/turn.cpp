@@ -12,6 +12,7 @@
 #include "cli/frame/terminal_box.h"
 #include "platform/files.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
@@ -47,13 +48,15 @@ Orientation TurnNamed(const std::string& name) {
   return found == std::end(kTurnNames) ? Orientation::Upright : found->turn;
 }
 
-// What is wrong with the options, as a sentence; empty when nothing is.
+// What is wrong with the options, a whole sentence; empty if nothing is.
 std::string CheckOptions(const TurnOptions& options) {
-  if (options.rotate.empty() && options.flip.empty() && !options.byExif) return "Say how to turn: --rotate, --flip or --by-exif.";
-  if (!options.inPlace && options.dest.empty()) return "Say where the turned files go: --dest DIR, or --in-place.";
-  if (options.keepTree && options.dest.empty()) return "--keep-tree needs --dest.";
+  if (options.rotate.empty() && options.flip.empty() && !options.byExif) {
+    return Tr("Choose --rotate, --flip or --by-exif.");
+  }
+  if (!options.inPlace && options.dest.empty()) return Tr("Choose --dest DIR or --in-place.");
+  if (options.keepTree && options.dest.empty()) return Tr("--keep-tree needs --dest.");
   if (!options.dest.empty() && platform::FileExists(options.dest) && !platform::IsFolder(options.dest)) {
-    return "\"" + options.dest + "\" is not a folder.";
+    return Tr("\"%1\" is not a folder.", options.dest);
   }
   return {};
 }
@@ -86,27 +89,25 @@ int RunTurnCommand(const TurnOptions& options, const CommandContext& context) {
 void SetUpTurn(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<TurnOptions>();
   AddSelection(app, options->selection, context);
-  AddChoice(app, "--rotate", options->rotate, "WAY", {"left", "right", "180"},
-            "Rotate by a quarter to the left or right, or by half");
-  AddChoice(app, "--flip", options->flip, "WAY", {"horizontal", "vertical"},
-            "Exchange left and right, or top and bottom; after --rotate where both are given");
-  AddFlag(app, "--by-exif", options->byExif, "Turn upright as EXIF says, in front of --rotate and --flip");
-  CLI::Option* dest = AddName(app, "-d,--dest", options->dest, "DIR", "Folder of the turned files, made with its parents");
+  AddChoice(app, "--rotate", options->rotate, "HOW", "Rotate by 90 degrees left or right, or by 180", {"left", "right", "180"});
+  AddChoice(app, "--flip", options->flip, "HOW", "Mirror: horizontal or vertical; applied after --rotate",
+            {"horizontal", "vertical"});
+  AddFlag(app, "--by-exif", options->byExif, "Rotate upright by EXIF orientation, before --rotate and --flip");
+  CLI::Option* dest = AddName(app, "-d,--dest", options->dest, "DIR", "Output folder, created if needed");
   Exclude(AddFlag(app, "--in-place", options->inPlace, "Replace each file"), dest);
-  AddChoice(app, "--overwrite", options->overwrite, "HOW", {"keep-both", "replace", "skip"},
-            "keep-both (the way unless given), replace or skip files of an output's name in --dest");
-  AddFlag(app, "--trim", options->trim, "Cut off edges that a JPEG picture cannot turn without loss");
-  AddFlag(app, "--keep-tree", options->keepTree, "Rebuild the folders of named folders in --dest");
-  AddFlag(app, "--keep-times", options->keepTimes, "Give turned files the times they had");
-  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, INT32_MAX, "Files at work at a time; 0, the default, is one a core");
-  AddFlag(app, "-n,--dry-run", options->dryRun, "Only print what would be done");
-  AddFlag(app, "--json", options->json, "One JSON array of {file, destination, status, message}");
-  SetFooter(
-      app,
-      "JPEG pictures turn without loss. One whose size is no multiple of its blocks (8 or 16 pixels) keeps its pixels and gets\n"
-      "an EXIF orientation instead, unless --trim is given; a message says so. Files of other formats are written anew, if\n"
-      "every pixel stays as it is.\n\n"
-      "Example: fotomill turn --by-exif --in-place holiday -r");
+  AddChoice(app, "--overwrite", options->overwrite, "HOW",
+            "If the output exists in --dest: keep-both (default), replace or skip", {"keep-both", "replace", "skip"});
+  AddFlag(app, "--trim", options->trim, "Crop JPEG edges that cannot be turned losslessly");
+  AddFlag(app, "--keep-tree", options->keepTree, "Recreate the source folders in --dest");
+  AddFlag(app, "--keep-times", options->keepTimes, "Keep the modification times of the sources");
+  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, INT32_MAX, "Number of parallel jobs (default: 0, one per core)");
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be done");
+  AddFlag(app, "--json", options->json, "Print a JSON array of {file, destination, status, message}");
+  SetFooter(app,
+            "JPEG pictures are turned losslessly. If the size is not a multiple of the block size (8 or 16 pixels), only the\n"
+            "EXIF orientation is changed and a message says so; --trim crops the edges instead. Files of other formats are\n"
+            "rewritten if no pixel changes.",
+            "fotomill turn --by-exif --in-place holiday -r");
   context.run = [options, &context] { return RunTurnCommand(*options, context); };
 }
 

@@ -10,6 +10,7 @@
 #include "cli/frame/used_files.h"
 #include "registry/registry.h"
 #include "settings/job_options.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
@@ -38,8 +39,8 @@ Status VerifyFile(const std::string& name, std::string& hint) {
     request.page = page;
     pages = picture->pageCount;
     RETURN_IF_BAD(ReadPicture(request, *picture));
-    if (!picture->warning.empty()) {  // it can be shown, but it is not what was saved
-      hint = picture->warning.view();
+    if (!picture->warning.empty()) {  // it can be shown, but data is missing
+      hint = Tr(picture->warning.view());
       return Status::DamagedFile;
     }
     if (pages > 1 && FormatRow(picture->formatIndex).animate != nullptr) return VerifyFrames(name);
@@ -69,7 +70,7 @@ int RunVerify(const VerifyOptions& options, const CommandContext& context) {
     }
     output.CountFile();
     used.Add(file.name);
-    if (!output.IsJson()) output.Line(output.Shown(file.name) + ": " + std::string(StatusMessage(status)));
+    if (!output.IsJson()) output.Line(output.Shown(file.name) + ": " + Tr(StatusMessage(status)));
   }
   return output.Finish();
 }
@@ -79,8 +80,8 @@ int RunVerify(const VerifyOptions& options, const CommandContext& context) {
 void SetUpVerify(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<VerifyOptions>();
   AddSelection(app, options->selection, context);
-  AddFlag(app, "--json", options->json, "One JSON array of {file, status, message}");
-  SetFooter(app, "Every page of every file is decoded in full; nothing is written.\n\nExample: fotomill verify -r holiday");
+  AddFlag(app, "--json", options->json, "Print a JSON array of {file, status, message}");
+  SetFooter(app, "Decodes every page of every file; writes nothing.", "fotomill verify -r holiday");
   context.run = [options, &context] { return RunVerify(*options, context); };
 }
 

@@ -20,10 +20,10 @@ inline constexpr int kExitOk = 0;
 inline constexpr int kExitFailed = 1;  // a file failed, or a lookup found nothing
 inline constexpr int kExitUsage = 2;   // nothing was touched
 
-// What stands on a command line beside its options: names of files, keys and the like.
+// The arguments of a command line that are not options: names of files, keys and the like.
 struct NameArguments {
   const char* placeholder = "";  // as the usage line shows them: "FILE...", "DB FILE..."; empty: the command takes none
-  const char* help = "";
+  const char* help = "";  // in English
   size_t least = 0;
   size_t most = 0;
   std::vector<std::string> values;  // any bytes, in order
@@ -47,6 +47,7 @@ struct GlobalOptions {
   bool noPlugins = false;
   std::string progress = "auto";  // auto, never
   std::string color = "auto";     // auto, always, never
+  std::string language;           // as in StartTexts; it counts before anything is parsed
 };
 
 struct Command;
@@ -61,13 +62,13 @@ struct CommandContext {
 
   // Whether there is somebody to ask.
   bool MayAsk() const { return io.Interactive() && !global.noInput; }
-  // Whether someone watches how far the command is.
+  // Whether to draw a progress bar.
   bool ProgressOn() const { return io.errTerminal && !global.quiet && global.progress != "never"; }
   // Whether messages, or results, are colored.
   bool ColorOn(bool terminal) const;
 };
 
-// What has to be there before a command runs.
+// What a command needs before it runs.
 enum class Needs : uint8_t {
   Nothing,
   Settings,  // the configuration, with --set on top
@@ -78,7 +79,7 @@ enum class Needs : uint8_t {
 // name may be two words ("tdb add").
 struct Command {
   const char* name;
-  const char* summary;  // begins with a verb, no full stop
+  const char* summary;  // in English; begins with a verb, no period
   Needs needs;
   // Declares options and help on the command's parser, its names in `context.names`, and sets `context.run`. Both
   // arguments outlive the run. Names never go through the parser's positional options, which read brackets, braces and
@@ -89,8 +90,8 @@ struct Command {
 // Parses and runs one command line; the exit status of the program. Never throws.
 int RunCommandLine(int count, const char* const* arguments, const Io& io);
 
-// Prints "fotomill COMMAND: MESSAGE" and where help is; returns kExitUsage. For mistakes that only a command can see,
-// before it touches anything.
+// Prints "fotomill COMMAND: MESSAGE" and where to find help; returns kExitUsage. For mistakes that only the command itself
+// can detect, before it touches anything.
 int UsageError(const CommandContext& context, std::string_view message);
 
 }  // namespace fotomill::cli

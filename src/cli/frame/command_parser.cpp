@@ -5,13 +5,14 @@
 #include <string_view>
 
 #include "cli/frame/options.h"
-#include "core/nearest_name.h"
+#include "texts/name_hint.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
 namespace {
 
-constexpr const char* kGlobalGroup = "Options of every command";
+
 constexpr size_t kFirstColumn = 26;
 
 // The option's placeholder instead of types, and the names as their command describes them.
@@ -19,15 +20,15 @@ class HelpFormatter : public CLI::Formatter {
  public:
   explicit HelpFormatter(const NameArguments& names) : names_(names) { column_width(kFirstColumn); }
   std::string make_usage(const CLI::App* app, std::string) const override {
-    std::string line = "\nUsage: " + app->get_name() + " [OPTION]...";
+    std::string line = app->get_name() + " [OPTION]...";
     if (*names_.placeholder != '\0') line += std::string(" ") + names_.placeholder;
-    return line + "\n";
+    return "\n" + Tr("Usage: %1", line) + "\n";
   }
   std::string make_positionals(const CLI::App*) const override {
     if (*names_.placeholder == '\0' || *names_.help == '\0') return {};
     std::stringstream out;
     out << '\n';
-    CLI::detail::format_help(out, names_.placeholder, names_.help, kFirstColumn);
+    CLI::detail::format_help(out, names_.placeholder, Tr(names_.help), kFirstColumn);
     return out.str();
   }
   std::string make_option_name(const CLI::Option* option, bool) const override {
@@ -43,19 +44,20 @@ class HelpFormatter : public CLI::Formatter {
 };
 
 void AddGlobalOptions(CLI::App& app, GlobalOptions& global) {
-  app.option_defaults()->group(kGlobalGroup);
-  AddName(app, "--data", global.dataFolder, "DIR", "Folder of the configuration and the stores");
-  AddRepeatedText(app, "--set", global.settings, "KEY=VALUE", "Give a configuration key a value for this run; may be repeated");
-  AddFlag(app, "-q,--quiet", global.quiet, "No progress and no closing lines");
-  AddFlag(app, "--no-input", global.noInput, "Never ask");
-  AddFlag(app, "--no-plugins", global.noPlugins, "Load no plug-ins");
-  AddChoice(app, "--progress", global.progress, "WHEN", {"auto", "never"}, "auto (on a terminal) or never");
-  AddChoice(app, "--color", global.color, "WHEN", {"auto", "always", "never"},
-            "auto (on a terminal, unless NO_COLOR is set), always or never");
-  app.set_help_flag("-h,--help", "Print this help");
+  app.option_defaults()->group(Tr("Options of every command"));
+  AddName(app, "--data", global.dataFolder, "DIR", "Data folder: configuration, thumbnail database, file history");
+  AddRepeatedText(app, "--set", global.settings, "KEY=VALUE", "Set a configuration key for this run; may be repeated");
+  AddFlag(app, "-q,--quiet", global.quiet, "No progress bar, notes or summary");
+  AddFlag(app, "--no-input", global.noInput, "Never ask questions");
+  AddFlag(app, "--no-plugins", global.noPlugins, "Do not load plug-ins");
+  AddChoice(app, "--progress", global.progress, "WHEN", "Progress bar: auto (on a terminal) or never", {"auto", "never"});
+  AddChoice(app, "--color", global.color, "WHEN", "Color: auto (on a terminal, unless NO_COLOR is set), always or never",
+            {"auto", "always", "never"});
+  AddName(app, "--lang", global.language, "CODE", "Language of messages, such as de or en (default: from the environment)");
+  app.set_help_flag("-h,--help", Tr("Show this help"));
 }
 
-// The parser would take "--name=" for an option whose value follows.
+// The parser would read "--name=" as an option whose value follows.
 void SplitEmptyValues(std::vector<std::string>& arguments) {
   for (size_t i = 0; i < arguments.size() && arguments[i] != "--"; ++i) {
     std::string& argument = arguments[i];
@@ -68,7 +70,7 @@ void SplitEmptyValues(std::vector<std::string>& arguments) {
 }  // namespace
 
 bool GlobalOptionTakesValue(std::string_view option) {
-  constexpr std::string_view kWithValue[] = {"--data", "--set", "--progress", "--color"};
+  constexpr std::string_view kWithValue[] = {"--data", "--set", "--progress", "--color", "--lang"};
   return std::ranges::find(kWithValue, option) != std::end(kWithValue);
 }
 
@@ -81,9 +83,10 @@ CommandParser::CommandParser(const Command* command, CommandContext& context)
   formatter(std::make_shared<HelpFormatter>(context.names));
   if (command != nullptr) {
     name(std::string("fotomill ") + command->name);
-    std::string summary = command->summary;
+    std::string summary = Tr(command->summary);
     summary[0] = static_cast<char>(std::toupper(static_cast<unsigned char>(summary[0])));
     description(summary + ".");
+    option_defaults()->group(Tr("Options"));
     command->setUp(*this, context);
   }
   AddGlobalOptions(*this, context.global);
@@ -92,13 +95,34 @@ CommandParser::CommandParser(const Command* command, CommandContext& context)
 void CommandParser::ParseArguments(std::vector<std::string> arguments) {
   SplitEmptyValues(arguments);
   std::reverse(arguments.begin(), arguments.end());
-  parse(std::move(arguments));
+  try {
+    parse(std::move(arguments));
+  } catch (const CLI::ParseError& error) {
+    Reword(error);
+    throw;
+  }
   TakeNames();
+}
+
+// Throws the parser's own complaints in our words, and in the user's language; returns for all others.
+void CommandParser::Reword(const CLI::ParseError& error) {
+  const std::string text = error.what(), kind = error.get_name();
+  const std::string option = text.substr(0, text.find_first_of(": "));
+  const auto refuse = [&](const std::string& message) {
+    throw CLI::ExtrasError(message, CLI::ExitCodes::ExtrasError);
+  };
+  if (kind == "ExcludesError") refuse(Tr("%1 and %2 cannot be combined.", option, text.substr(text.rfind(' ') + 1)));
+  if (kind == "RequiredError") refuse(Tr("%1 is missing.", option));
+  if (kind != "ArgumentMismatch") return;
+  const CLI::Option* const found = get_option_no_throw(option);
+  const int values = found == nullptr ? 1 : found->get_expected_min() * found->get_type_size();
+  if (values > 1) refuse(TrCount("%2 needs %1 value.", "%2 needs %1 values.", static_cast<uint64_t>(values), option));
+  refuse(text.find("received") != std::string::npos ? Tr("%1 was given twice.", option) : Tr("%1 needs a value.", option));
 }
 
 std::string CommandParser::HelpPage() const { return CLI::detail::find_and_replace(help(), "\n\n\n", "\n\n"); }
 
-// What the parser did not know is a name, or an option that there is not.
+// What the parser did not recognize is a name or an unknown option.
 void CommandParser::TakeNames() {
   NameArguments& names = context_.names;
   bool namesOnly = false;
@@ -111,9 +135,11 @@ void CommandParser::TakeNames() {
       RefuseOption(text);
     }
   }
-  if (names.values.size() < names.least) throw CLI::RequiredError(names.placeholder);
+  if (names.values.size() < names.least) {
+    throw CLI::ExtrasError(Tr("%1 is missing.", names.placeholder), CLI::ExitCodes::ExtrasError);
+  }
   if (names.values.size() > names.most) {
-    throw CLI::ExtrasError("\"" + names.values[names.most] + "\" is one argument too many", CLI::ExitCodes::ExtrasError);
+    throw CLI::ExtrasError(Tr("Unexpected argument \"%1\".", names.values[names.most]), CLI::ExitCodes::ExtrasError);
   }
 }
 
@@ -124,7 +150,7 @@ void CommandParser::RefuseOption(const std::string& typed) const {
     for (const std::string& longName : option->get_lnames()) known.push_back("--" + longName);
   }
   const std::vector<std::string_view> names(known.begin(), known.end());
-  throw CLI::ExtrasError("There is no option \"" + name + "\"." + NearestNameHint(name, names), CLI::ExitCodes::ExtrasError);
+  throw CLI::ExtrasError(Tr("Unknown option \"%1\".", name) + NearestNameHint(name, names), CLI::ExitCodes::ExtrasError);
 }
 
 }  // namespace fotomill::cli

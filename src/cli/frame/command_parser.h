@@ -8,7 +8,7 @@
 
 namespace fotomill::cli {
 
-// The parser of one command: its options and the global ones by CLI11, its names by itself, byte for byte as typed.
+// The parser of one command: CLI11 reads its options and the global ones; names are read here, byte for byte as typed.
 class CommandParser : public CLI::App {
  public:
   // `command` may be null: then there are the global options only. `context` outlives the parser.
@@ -19,13 +19,14 @@ class CommandParser : public CLI::App {
   std::string HelpPage() const;
 
  private:
+  void Reword(const CLI::ParseError& error);
   void TakeNames();
   [[noreturn]] void RefuseOption(const std::string& typed) const;
 
   CommandContext& context_;
 };
 
-// Whether an option that stands before the command takes the next argument as its value.
+// Whether an option before the command takes the next argument as its value.
 bool GlobalOptionTakesValue(std::string_view option);
 
 }  // namespace fotomill::cli

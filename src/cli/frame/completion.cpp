@@ -8,14 +8,16 @@
 
 #include "cli/frame/command_parser.h"
 #include "cli/frame/commands.h"
+#include "cli/frame/options.h"
 #include "core/text.h"
 #include "registry/registry.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
 namespace {
 
-// What a shell has to know of one command.
+// What a shell needs to know about a command.
 struct CommandWords {
   std::string name;  // one word or two
   std::string summary;
@@ -35,7 +37,7 @@ std::vector<CommandWords> AllCommands() {
   std::vector<CommandWords> words;
   for (const Command& command : Commands()) {
     CommandContext context;
-    words.push_back({command.name, command.summary, OptionsOf(CommandParser(&command, context))});
+    words.push_back({command.name, Tr(command.summary), OptionsOf(CommandParser(&command, context))});
   }
   return words;
 }
@@ -46,7 +48,7 @@ std::string Joined(const std::vector<std::string>& words) {
   return text;
 }
 
-// The words that may stand in the place of the command's first one.
+// The words that may come first.
 std::string FirstWords(const std::vector<CommandWords>& commands) {
   std::vector<std::string> words;
   std::set<std::string> seen;
@@ -80,7 +82,7 @@ constexpr const char* kBash = R"sh(_fotomill() {
   COMPREPLY=()
   for ((i = 1; i < COMP_CWORD; ++i)); do
     case ${COMP_WORDS[i]} in
-      --data|--set|--progress|--color) ((++i)) ;;
+      --data|--set|--progress|--color|--lang) ((++i)) ;;
       -*) ;;
       *) command+="${command:+ }${COMP_WORDS[i]}"
          [[ $command == *' '* || -z $(_fotomill_second "$command") ]] && break ;;
@@ -192,7 +194,7 @@ int RunCompletion(const CommandContext& context) {
   if (shell == "bash") script = BashScript(commands);
   if (shell == "zsh") script = ZshScript(commands);
   if (shell == "fish") script = FishScript(commands);
-  if (script.empty()) return UsageError(context, "There is no completion for \"" + shell + "\": bash, zsh or fish.");
+  if (script.empty()) return UsageError(context, Tr("There is no completion for \"%1\"; choose bash, zsh or fish.", shell));
   std::fwrite(script.data(), 1, script.size(), context.io.out);
   return kExitOk;
 }
@@ -201,7 +203,7 @@ int RunCompletion(const CommandContext& context) {
 
 void SetUpCompletion(CLI::App& app, CommandContext& context) {
   context.names.Declare("SHELL", "bash, zsh or fish", 1, 1);
-  app.footer("Example: fotomill completion bash > ~/.local/share/bash-completion/completions/fotomill");
+  SetFooter(app, nullptr, "fotomill completion bash > ~/.local/share/bash-completion/completions/fotomill");
   context.run = [&context] { return RunCompletion(context); };
 }
 

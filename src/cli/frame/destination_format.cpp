@@ -4,16 +4,17 @@
 #include <utility>
 #include <vector>
 
-#include "core/nearest_name.h"
 #include "core/text.h"
 #include "registry/registry.h"
+#include "texts/name_hint.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
 namespace {
 
-// The row that an extension names in full; the looser rules for reading would make an AVI of "x.avif". Other spellings
-// of a format's name are taken as well.
+// The row with exactly this extension; the looser rules for reading would make an AVI of "x.avif". Common other spellings
+// are accepted.
 int32_t RowOfExtension(std::string_view extension) {
   constexpr std::pair<std::string_view, std::string_view> kSpellings[] = {
       {"tiff", "TIF"}, {"fits", "FIT"}, {"targa", "TGA"}, {"pict", "PCT"}};
@@ -37,7 +38,7 @@ std::string UnknownFormat(const std::string& extension) {
   }
   for (const PluginFormatFacts& format : PluginFormats()) known.push_back(LowerCase(format.extension));
   const std::vector<std::string_view> names(known.begin(), known.end());
-  return "There is no format \"" + extension + "\"." + NearestNameHint(extension, names);
+  return Tr("Unknown format \"%1\".", extension) + NearestNameHint(extension, names);
 }
 
 }  // namespace
@@ -47,7 +48,7 @@ std::string ReadDestinationFormat(const std::string& extension, BatchJob& job) {
   if (job.formatIndex == kNoFormat) return UnknownFormat(extension);
   const FormatEntry& row = FormatRow(job.formatIndex);
   job.extension = row.extension.view();
-  return CanWrite(row) ? std::string() : job.extension + " cannot be written. " + std::string(WhyNot(row));
+  return CanWrite(row) ? std::string() : Tr("%1 cannot be written.", job.extension) + " " + Tr(WhyNot(row));
 }
 
 }  // namespace fotomill::cli

@@ -6,8 +6,8 @@
 
 namespace fotomill::cli {
 
-// Takes the format that an extension names in full, or one of the other spellings that people use, into the job. Returns what
-// is wrong with it, a whole sentence: there is none of that name, or it cannot be written. Empty when all is well.
+// Puts the format with this extension, or a common other spelling of it, into the job. Returns what is wrong, a whole
+// sentence: the format is unknown or cannot be written. Empty if nothing is.
 std::string ReadDestinationFormat(const std::string& extension, BatchJob& job);
 
 }  // namespace fotomill::cli

@@ -8,6 +8,7 @@
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "registry/registry.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
@@ -15,7 +16,7 @@ namespace {
 
 constexpr int kDeepestFolder = 64;
 
-// Everything from a stream, up to the limit of list files; false when there is more or it cannot be read.
+// Reads a whole stream, up to the limit of list files; false if it is longer or cannot be read.
 bool ReadStream(std::FILE* stream, std::string& contents) {
   char buffer[16384];
   while (const size_t count = std::fread(buffer, 1, sizeof buffer, stream)) {
@@ -46,7 +47,7 @@ class Selector {
       trail_.insert({facts.device, facts.identity});
       AddFolder(name, {}, 0);
     } else if (facts.kind == platform::FileKind::Missing) {
-      files_.push_back({name, {}, Status::FileOpenError, "There is no such file."});
+      files_.push_back({name, {}, Status::FileOpenError, Tr("The file does not exist.")});
     } else {
       files_.push_back({name, {}, Status::Ok, {}});
     }
@@ -57,7 +58,7 @@ class Selector {
   void AddFolder(const std::string& folder, const std::string& below, int depth) {
     const auto entries = platform::ListFolder(folder);
     if (!entries) {
-      files_.push_back({folder, below, Status::FileOpenError, "The folder cannot be read."});
+      files_.push_back({folder, below, Status::FileOpenError, Tr("The folder cannot be read.")});
       return;
     }
     for (const platform::FolderEntry& entry : *entries) {
@@ -74,10 +75,10 @@ class Selector {
     return entry.kind == platform::FileKind::Regular || (entry.link && platform::IsRegularFile(path));
   }
 
-  // A folder that is among its own parents, as mounts can make it, is left alone.
+  // Skips a folder that is its own ancestor, which mounts can cause.
   void Descend(const std::string& folder, const std::string& below, int depth) {
     if (depth > kDeepestFolder) {
-      files_.push_back({folder, below, Status::FileOpenError, "The folders are nested too deeply."});
+      files_.push_back({folder, below, Status::FileOpenError, Tr("The folders are nested too deeply.")});
       return;
     }
     const platform::FileFacts facts = platform::FactsOf(folder);
@@ -95,10 +96,10 @@ class Selector {
 }  // namespace
 
 void AddSelection(CLI::App& app, SelectionOptions& options, CommandContext& context) {
-  context.names.Declare("FILE...", "Pictures, and folders whose pictures are meant", 0);
-  AddFlag(app, "-r,--recursive", options.recursive, "Take the folders in named folders as well");
-  AddName(app, "--files-from", options.filesFrom, "FILE|-", "Take names from a file, one a line; - is the standard input");
-  AddFlag(app, "-0,--null", options.zeroTerminated, "Names in that file end in a zero byte instead");
+  context.names.Declare("FILE...", "Picture files, or folders of pictures", 0);
+  AddFlag(app, "-r,--recursive", options.recursive, "Descend into subfolders");
+  AddName(app, "--files-from", options.filesFrom, "FILE|-", "Read names from a file, one per line; - is standard input");
+  AddFlag(app, "-0,--null", options.zeroTerminated, "Names in that file are separated by NUL (find -print0)");
 }
 
 std::optional<std::vector<SelectedFile>> SelectFiles(const SelectionOptions& options, const CommandContext& context) {
@@ -106,16 +107,16 @@ std::optional<std::vector<SelectedFile>> SelectFiles(const SelectionOptions& opt
   std::string list;
   if (options.filesFrom == "-") {
     if (!ReadStream(context.io.in, list)) {
-      UsageError(context, "The list of names on the standard input cannot be read.");
+      UsageError(context, Tr("The list of names on standard input cannot be read."));
       return std::nullopt;
     }
   } else if (!options.filesFrom.empty()) {
     if (platform::ReadWholeFile(options.filesFrom, limits.listFileBytes, list) != platform::ReadResult::Done) {
-      UsageError(context, "The list of names \"" + options.filesFrom + "\" cannot be read.");
+      UsageError(context, Tr("The list of names \"%1\" cannot be read.", options.filesFrom));
       return std::nullopt;
     }
   } else if (context.names.values.empty()) {
-    UsageError(context, "No files are named.");
+    UsageError(context, Tr("No files given."));
     return std::nullopt;
   }
   for (const std::string& name : context.names.values) selector.Add(name);

@@ -23,10 +23,9 @@ struct SelectionOptions {
 // Declares the FILE... names of a command and the options that choose files.
 void AddSelection(CLI::App& app, SelectionOptions& options, CommandContext& context);
 
-// The files of a command line: named ones in order, a folder in place of which its files stand (in byte order, those
-// whose name selects a format; with `recursive` those of its folders as well, links to folders left out), names read
-// from a list behind them. What is not there is in the list with its status. nullopt, after a message, when nothing was
-// named or the list of names cannot be read: a usage error.
+// The files of a command line in order: files as named; for a folder, its files whose name selects a format, in byte order
+// (with `recursive` also those of subfolders, except behind links); then the names read from a list. A missing file is in
+// the result with its status. nullopt, after a message, if nothing was named or the list cannot be read: a usage error.
 std::optional<std::vector<SelectedFile>> SelectFiles(const SelectionOptions& options, const CommandContext& context);
 
 }  // namespace fotomill::cli

@@ -4,7 +4,7 @@
 
 namespace fotomill::cli {
 
-// Where a command reads and prints and what it may assume about the terminal; tests hand in files of their own.
+// The streams of a command and what is known about the terminal; tests pass files of their own.
 struct Io {
   std::FILE* in = stdin;
   std::FILE* out = stdout;  // results only
@@ -12,9 +12,9 @@ struct Io {
   bool inTerminal = false;
   bool outTerminal = false;
   bool errTerminal = false;
-  bool outStored = false;  // results go to a file: they may be kept for a moment and written together
+  bool outStored = false;  // results go to a file and may be buffered for a moment
 
-  // Questions may be asked: someone sees them and can answer.
+  // Whether questions may be asked.
   bool Interactive() const { return inTerminal && errTerminal; }
 };
 

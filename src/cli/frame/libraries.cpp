@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "registry/registry.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
@@ -22,14 +23,14 @@ std::string LcmsVersion() { return std::to_string(LCMS_VERSION / 1000) + "." + s
 
 std::vector<Library> MakeLibraries() {
   std::vector<Library> libraries = {
-      {"CLI11", CLI11_VERSION, "the command line"},
+      {"CLI11", CLI11_VERSION, TrLater("the command line")},
       {"nlohmann-json",
        FOTOMILL_VERSION_OF(NLOHMANN_JSON_VERSION_MAJOR, NLOHMANN_JSON_VERSION_MINOR, NLOHMANN_JSON_VERSION_PATCH),
-       "results as JSON"},
+       TrLater("results as JSON")},
   };
   for (const FormatLibrary& library : LibrariesOfFormats())
     libraries.push_back({library.name, library.version(), library.purpose});
-  libraries.push_back({"lcms2", LcmsVersion(), "color profiles, in the desktop program"});
+  libraries.push_back({"lcms2", LcmsVersion(), TrLater("color profiles, in the desktop program")});
   return libraries;
 }
 

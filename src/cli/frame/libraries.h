@@ -5,14 +5,14 @@
 
 namespace fotomill::cli {
 
-// A library that the program is built with, or that it loads.
+// A library that the program is linked with or loads.
 struct Library {
   const char* name;
   std::string version;
-  const char* purpose;
+  const char* purpose;  // in English
 };
 
-// All of them, for the version page and the check-up.
+// All of them, for the version page and "doctor".
 std::span<const Library> Libraries();
 
 }  // namespace fotomill::cli

@@ -2,44 +2,67 @@
 
 #include <CLI/CLI.hpp>
 
+#include "core/whole_number.h"
+#include "texts/texts.h"
+
 namespace fotomill::cli {
 
-CLI::Option* AddFlag(CLI::App& app, const char* names, bool& value, const char* help) { return app.add_flag(names, value, help); }
+CLI::Option* AddFlag(CLI::App& app, const char* names, bool& value, const char* help) {
+  return app.add_flag(names, value, Tr(help));
+}
 
 CLI::Option* AddText(CLI::App& app, const char* names, std::string& value, const char* shownAs, const char* help) {
-  return app.add_option(names, value, help)->option_text(shownAs);
+  return app.add_option(names, value, Tr(help))->option_text(shownAs);
 }
 
 CLI::Option* AddName(CLI::App& app, const char* names, std::string& value, const char* shownAs, const char* help) {
-  const CLI::Validator notEmpty([](const std::string& text) { return text.empty() ? "is empty" : std::string(); }, "");
+  const CLI::Validator notEmpty([](const std::string& text) { return text.empty() ? Tr("is empty") : std::string(); }, "");
   return AddText(app, names, value, shownAs, help)->check(notEmpty);
 }
 
-CLI::Option* AddChoice(CLI::App& app, const char* names, std::string& value, const char* shownAs,
-                       std::initializer_list<const char*> choices, const char* help) {
-  return AddText(app, names, value, shownAs, help)
-      ->check(CLI::IsMember(std::vector<std::string>(choices.begin(), choices.end())));
+CLI::Option* AddChoice(CLI::App& app, const char* names, std::string& value, const char* shownAs, const char* help,
+                       std::initializer_list<const char*> choices) {
+  const std::vector<std::string> words(choices.begin(), choices.end());
+  const CLI::Validator isWord(
+      [words](const std::string& text) {
+        if (std::ranges::find(words, text) != words.end()) return std::string();
+        std::string list;
+        for (const std::string& word : words) list += (list.empty() ? "" : ", ") + word;
+        return Tr("\"%1\" is not one of %2", text, list);
+      },
+      "");
+  return AddText(app, names, value, shownAs, help)->check(isWord);
 }
 
 CLI::Option* AddNumber(CLI::App& app, const char* names, int32_t& value, const char* shownAs, int32_t least, int32_t most,
                        const char* help) {
-  return app.add_option(names, value, help)->option_text(shownAs)->check(CLI::Range(least, most));
+  const CLI::Validator inRange(
+      [least, most](const std::string& text) {
+        const auto number = ParseNumber<int32_t>(text);
+        if (number && *number >= least && *number <= most) return std::string();
+        if (most == INT32_MAX) return Tr("\"%1\" is not a whole number of at least %2", text, least);
+        return Tr("\"%1\" is not a whole number from %2 to %3", text, least, most);
+      },
+      "");
+  return app.add_option(names, value, Tr(help))->option_text(shownAs)->check(inRange);
 }
 
 CLI::Option* AddTexts(CLI::App& app, const char* names, std::vector<std::string>& values, int count, const char* shownAs,
                       const char* help) {
-  return app.add_option(names, values, help)->option_text(shownAs)->expected(count)->allow_extra_args(false);
+  return app.add_option(names, values, Tr(help))->option_text(shownAs)->expected(count)->allow_extra_args(false);
 }
 
 CLI::Option* AddRepeatedText(CLI::App& app, const char* names, std::vector<std::string>& values, const char* shownAs,
                              const char* help) {
-  return app.add_option(names, values, help)->option_text(shownAs)->allow_extra_args(false);
+  return app.add_option(names, values, Tr(help))->option_text(shownAs)->allow_extra_args(false);
 }
 
 void Require(CLI::Option* option) { option->required(); }
 
 void Exclude(CLI::Option* option, CLI::Option* other) { option->excludes(other); }
 
-void SetFooter(CLI::App& app, const std::string& text) { app.footer(text); }
+void SetFooter(CLI::App& app, const char* notes, const char* example) {
+  app.footer((notes == nullptr ? "" : std::string(Tr(notes)) + "\n\n") + Tr("Example: %1", example));
+}
 
 }  // namespace fotomill::cli

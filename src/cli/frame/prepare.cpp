@@ -8,6 +8,7 @@
 #include "settings/configuration.h"
 #include "settings/format_switches.h"
 #include "settings/plugin_settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
@@ -17,7 +18,7 @@ std::string PrepareFor(const Command& command, const GlobalOptions& global) {
   (void)LoadConfiguration();  // a file that is missing or cannot be read leaves the defaults
   for (const std::string_view setting : global.settings) {
     const size_t equals = setting.find('=');
-    if (equals == std::string_view::npos) return "--set takes KEY=VALUE, not \"" + std::string(setting) + "\".";
+    if (equals == std::string_view::npos) return Tr("--set takes KEY=VALUE, not \"%1\".", setting);
     const SetResult result = SetSetting(setting.substr(0, equals), setting.substr(equals + 1));
     if (!result.Ok()) return "--set: " + result.message;
   }

@@ -2,6 +2,7 @@
 
 #include "operations/recipe_library.h"
 #include "settings/key_texts.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
@@ -9,7 +10,7 @@ bool ReadRecipeOptions(const RecipeOptions& options, const CommandContext& conte
   const bool given = !options.steps.empty() || !options.recipe.empty();
   if (!given && !options.needed) return true;
   std::string text = options.steps, path, wrong;
-  if (!given) wrong = "Name operations with --do, or a recipe with --recipe.";
+  if (!given) wrong = Tr("Name operations with --do, or a recipe with --recipe.");
   if (!options.recipe.empty()) wrong = FindRecipe(options.recipe, text, path);
   auto read = std::make_shared<Recipe>();
   if (wrong.empty()) {

@@ -3,6 +3,7 @@
 #include "batch/progress_model.h"
 #include "cli/frame/shown_text.h"
 #include "platform/process.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
@@ -12,7 +13,7 @@ constexpr std::string_view kRed = "\x1b[31m", kPlain = "\x1b[0m";
 
 void Write(std::FILE* stream, std::string_view text) { std::fwrite(text.data(), 1, text.size(), stream); }
 
-// JSON text in which control characters beyond ASCII, which JSON lets stand, are escaped too: it may go to a terminal.
+// JSON text that also escapes the control characters beyond ASCII, which JSON permits: it may go to a terminal.
 std::string SafeJson(const Json& value) {
   const std::string text = value.dump(-1, ' ', false, Json::error_handler_t::replace);
   if (text.find('\x7F') == std::string::npos && text.find('\xC2') == std::string::npos) return text;
@@ -105,7 +106,7 @@ void ResultOutput::Failure(std::string_view name, Status status, std::string_vie
   ++failures_;
   std::string text = ShownMessage(name) + ": ";
   if (colored_) text += kRed;
-  text += StatusMessage(status);
+  text += Tr(StatusMessage(status));
   if (colored_) text += kPlain;
   if (!hint.empty()) text += " " + ShownMessage(hint);
   Message(text);
@@ -121,7 +122,7 @@ int ResultOutput::Finish() {
   progress_.Clear();
   EndArray();
   if (!context_.global.quiet) {
-    if (failures_ > 0) Message(kErrorsLine);
+    if (failures_ > 0) Message(Tr(kErrorsLine));
     Message(CountLine(static_cast<uint32_t>(files_)));
   }
   return failures_ > 0 ? kExitFailed : kExitOk;
@@ -135,7 +136,7 @@ void ResultOutput::EndArray() {
   ended_ = true;
 }
 
-// Results that came before are on their way first, so that the two streams keep their order where they meet.
+// Earlier results are flushed first, so that both streams keep their order on one terminal.
 void ResultOutput::Message(std::string_view text) {
   MakeWay();
   std::string line(text);
@@ -144,13 +145,12 @@ void ResultOutput::Message(std::string_view text) {
   std::fflush(context_.io.err);
 }
 
-// Where results and messages meet on one terminal, the line of the progress makes way for both.
+// On a terminal, the progress line is cleared before a result.
 void ResultOutput::ClearForResult() {
   if (context_.io.outTerminal) progress_.Clear();
 }
 
-// Sends results on their way. Those for a file may wait for others for a moment, as thousands of small writes cost more
-// than some commands.
+// Flushes results. If they go to a file, at most ten times a second: thousands of small writes cost more than some commands.
 void ResultOutput::Deliver(bool now) {
   constexpr std::chrono::milliseconds kLongestWait{100};
   if (context_.io.outStored && !now) {

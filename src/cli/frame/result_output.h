@@ -15,58 +15,56 @@ namespace fotomill::cli {
 // Members keep the order in which they were set.
 using Json = nlohmann::ordered_json;
 
-// Sets `key` to a name. One that is not UTF-8 also sets `key` + "Bytes", its bytes in base64; `key` then has U+FFFD in
-// the places that are none.
+// Sets `key` to a name. If it is not UTF-8, also sets `key` + "Bytes" to its bytes in base64; `key` then has U+FFFD in place
+// of invalid bytes.
 void PutName(Json& object, const std::string& key, std::string_view name);
-// Sets `status` and `message`.
+// Sets `status` and `message`; the message is English in every language.
 void PutStatus(Json& object, Status status);
 
-// The output of one command over many things, in the order in which they happen: results on the standard output, as
-// lines or as one JSON array with an element a line, and messages on the standard error. Nothing is held back,
-// except that results for a file are written a few times a second only.
+// The output of one command, in order: results on standard output, as lines or as one JSON array with one element per line,
+// and messages on standard error. Only results that go to a file are buffered, for a tenth of a second.
 class ResultOutput {
  public:
   ResultOutput(const CommandContext& context, bool json);
   ResultOutput(const ResultOutput&) = delete;
   ResultOutput& operator=(const ResultOutput&) = delete;
-  ~ResultOutput();  // ends the array, whatever happened
+  ~ResultOutput();  // ends the array
 
   // Whether results are elements of a JSON array.
   bool IsJson() const { return json_; }
-  // A name as a line shows it: escaped on a terminal, byte for byte elsewhere.
+  // A name for a result line: escaped on a terminal, else byte for byte.
   std::string Shown(std::string_view name) const;
   // The same for messages.
   std::string ShownMessage(std::string_view name) const;
 
-  // One result line, without its end; the caller has escaped what needs it. Not for JSON.
+  // One result line, without line end, already escaped. Not for JSON.
   void Line(std::string_view line);
   // One element of the array. Only for JSON.
   void Element(const Json& element);
-  // Counts a thing that was dealt with: the closing line tells how many there were.
+  // Counts a processed file, for the closing line.
   void CountFile();
-  // The message of a file that failed, "NAME: MESSAGE", with a hint behind it where there is one. Counts it as well.
+  // Prints the message of a failed file, "NAME: MESSAGE", followed by the hint if any, and counts it.
   void Failure(std::string_view name, Status status, std::string_view hint = {});
-  // A remark on the standard error that is no failure; left out by --quiet.
+  // A note on standard error, not a failure; suppressed by --quiet.
   void Note(std::string_view text);
-  // A line on the standard error.
+  // A line on standard error.
   void Message(std::string_view text);
 
-  // How far the command is, for who watches it on a terminal: told each time, or counted by itself up to `files`.
+  // Progress on a terminal: either set each time, or counted by CountFile up to `files`.
   void ShowProgress(uint64_t done, uint64_t total);
   void Expect(uint64_t files);
-  // Time to tell the time again.
+  // Redraws the progress if it is time.
   void Tick() { progress_.Tick(); }
-  // Everything printed so far is on its way, and the line of the progress is gone: before a question.
+  // Flushes everything and clears the progress line, before a question.
   void MakeWay();
 
-  // False once the standard output takes nothing more, or the user has asked the program to end: loops over files end
-  // then.
+  // False once standard output fails or the user has interrupted the program: loops over files end then.
   bool GoesOn() const;
   bool Failed() const { return failures_ > 0; }
   // Ends the array, prints the closing lines ("There were errors", "3 files were processed.") and returns the exit
   // status.
   int Finish();
-  // Ends the array: no results come any more.
+  // Ends the array; no more results follow.
   void EndArray();
 
  private:
@@ -81,7 +79,7 @@ class ResultOutput {
   std::chrono::steady_clock::time_point delivered_;
   TerminalProgress progress_;
   uint64_t expected_ = 0;
-  bool counts_ = false;  // how far it is shows by the files that were counted
+  bool counts_ = false;  // CountFile drives the progress
   uint64_t files_ = 0;
   uint64_t failures_ = 0;
 };

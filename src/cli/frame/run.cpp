@@ -9,9 +9,10 @@
 #include "cli/frame/commands.h"
 #include "cli/frame/help.h"
 #include "cli/frame/prepare.h"
-#include "core/nearest_name.h"
 #include "core/shown_text.h"
 #include "platform/process.h"
+#include "texts/name_hint.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
@@ -22,8 +23,8 @@ using Arguments = std::vector<std::string>;
 void Print(std::FILE* stream, std::string_view text) { std::fwrite(text.data(), 1, text.size(), stream); }
 
 int Complain(const Io& io, const std::string& message, const std::string& topic = {}) {
-  Print(io.err, "fotomill: " + (io.errTerminal ? EscapeControls(message) : message) + "\nTry \"fotomill help" +
-                    (topic.empty() ? "" : " " + topic) + "\".\n");
+  const std::string help = "fotomill help" + (topic.empty() ? "" : " " + topic);
+  Print(io.err, "fotomill: " + (io.errTerminal ? EscapeControls(message) : message) + "\n" + Tr("Try \"%1\".", help) + "\n");
   return kExitUsage;
 }
 
@@ -67,7 +68,7 @@ CommandName NameOfCommand(const Arguments& arguments, size_t place) {
 int RefuseCommand(const std::string& name, const Io& io) {
   std::vector<std::string_view> names{"help"};
   for (const Command& command : Commands()) names.emplace_back(command.name);
-  return Complain(io, "There is no command \"" + name + "\"." + NearestNameHint(name, names));
+  return Complain(io, Tr("Unknown command \"%1\".", name) + NearestNameHint(name, names));
 }
 
 int PrintHelp(const Arguments& words, const Io& io) {
@@ -95,7 +96,7 @@ int ParseAndRun(const Command* command, const Arguments& arguments, const Io& io
     return Complain(io, (command == nullptr ? "" : std::string(command->name) + ": ") + error.what(),
                     command == nullptr ? "" : command->name);
   }
-  if (command == nullptr) return Complain(io, "A command is missing.");
+  if (command == nullptr) return Complain(io, Tr("No command given."));
   const std::string problem = PrepareFor(*command, context.global);
   if (!problem.empty()) return Complain(io, std::string(command->name) + ": " + problem, command->name);
   const int status = context.run();
@@ -103,7 +104,29 @@ int ParseAndRun(const Command* command, const Arguments& arguments, const Io& io
   return status;
 }
 
+// The value of --lang, wherever it is: texts are needed before the command line is parsed. Empty without one.
+std::string WantedLanguage(const Arguments& arguments) {
+  constexpr std::string_view kOption = "--lang";
+  std::string language;
+  for (size_t i = 0; i < arguments.size() && arguments[i] != "--"; ++i) {
+    const std::string_view argument = arguments[i];
+    if (argument == kOption && i + 1 < arguments.size()) language = arguments[i + 1];
+    if (argument.starts_with(kOption) && argument.substr(kOption.size()).starts_with('=')) {
+      language = argument.substr(kOption.size() + 1);
+    }
+  }
+  return language;
+}
+
+int RefuseLanguage(const std::string& code, const Io& io) {
+  std::string list;
+  for (const Language& language : Languages()) list += (list.empty() ? "" : ", ") + language.code;
+  return Complain(io, Tr("There is no translation \"%1\"; there are: %2.", code, list));
+}
+
 int Dispatch(Arguments arguments, const Io& io) {
+  const std::string language = WantedLanguage(arguments);
+  if (!StartTexts(language)) return RefuseLanguage(language, io);
   const std::optional<size_t> place = FindWord(arguments, 0);
   for (size_t i = 0; i < place.value_or(arguments.size()); ++i) {
     if (arguments[i] == "--") break;
@@ -158,12 +181,12 @@ int RunCommandLine(int count, const char* const* arguments, const Io& io) {
   try {
     status = Dispatch(Arguments(arguments + (count > 0 ? 1 : 0), arguments + count), io);
   } catch (const std::bad_alloc&) {
-    Print(io.err, "fotomill: Memory allocation error.\n");
+    Print(io.err, std::string("fotomill: ") + Tr("Memory allocation error.") + "\n");
   } catch (const std::exception& error) {
     Print(io.err, std::string("fotomill: ") + error.what() + "\n");
   }
   if (std::fflush(io.out) != 0 || std::ferror(io.out) != 0) {
-    Print(io.err, "fotomill: The results could not be written.\n");
+    Print(io.err, std::string("fotomill: ") + Tr("The results could not be written.") + "\n");
     if (status == kExitOk) status = kExitFailed;
   }
   const int asked = platform::PendingExit();

@@ -1,6 +1,8 @@
 #include "cli/frame/terminal_box.h"
 #include "settings/job_options.h"
 
+#include "texts/texts.h"
+
 namespace fotomill::cli {
 
 void TerminalBox::ShowLine(const ProgressLine& line, const FileOutcome* outcome) {
@@ -16,8 +18,8 @@ void TerminalBox::ShowLine(const ProgressLine& line, const FileOutcome* outcome)
   }
   if (outcome->status != Status::Ok) return output_.Failure(outcome->source, outcome->status, outcome->hint);
   if (!output_.IsJson()) output_.Line(output_.Shown(outcome->source) + " -> " + output_.Shown(outcome->destination));
-  if (tellReplaced_ && outcome->replaced) output_.Note(name + "replaced " + output_.ShownMessage(outcome->destination) + ".");
-  if (verbose_ && !outcome->note.empty()) output_.Note(name + outcome->note);
+  if (tellReplaced_ && outcome->replaced) output_.Note(name + Tr("replaced %1.", output_.ShownMessage(outcome->destination)));
+  if (verbose_ && !outcome->note.empty()) output_.Note(name + outcome->note.shown);
 }
 
 void TerminalBox::ShowElement(const FileOutcome& outcome) {
@@ -27,7 +29,7 @@ void TerminalBox::ShowElement(const FileOutcome& outcome) {
   if (!outcome.output.empty()) element["output"] = outcome.output;
   PutStatus(element, outcome.status);
   if (outcome.skipped) element["skipped"] = true;
-  if (!outcome.note.empty()) element["note"] = outcome.note;
+  if (!outcome.note.empty()) element["note"] = outcome.note.english;
   output_.Element(element);
 }
 

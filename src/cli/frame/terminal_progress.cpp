@@ -5,6 +5,7 @@
 
 #include "platform/clock.h"
 #include "platform/process.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
@@ -29,13 +30,13 @@ std::string DurationText(double seconds) {
 }  // namespace
 
 std::string ProgressText(uint64_t done, uint64_t total, double seconds, int width) {
-  std::string text = std::to_string(done) + " of " + std::to_string(total);
+  std::string text = Tr("%1 of %2", done, total);
   if (done > 0 && seconds > 0) {
     const double rate = static_cast<double>(done) / seconds;
     char number[32];
     std::snprintf(number, sizeof number, rate < 10 ? ", %.1f/s" : ", %.0f/s", rate);
     text += number;
-    if (done < total) text += ", " + DurationText(static_cast<double>(total - done) / rate) + " left";
+    if (done < total) text += ", " + Tr("%1 left", DurationText(static_cast<double>(total - done) / rate));
   }
   const int room = std::min(width - static_cast<int>(text.size()) - 3, kLongestBar);
   if (room < kShortestBar) return text.substr(0, static_cast<size_t>(std::max(width, 0)));

@@ -6,8 +6,8 @@
 
 namespace fotomill::cli {
 
-// A line at the bottom of a terminal that tells how far a command is: a bar, the count, the rate and the time left. It shows
-// up once the command has taken a moment, and is redrawn a few times a second.
+// The progress line at the bottom of a terminal: a bar, the count, the rate and the time left. It appears after half a
+// second and is redrawn ten times a second.
 class TerminalProgress {
  public:
   // `shown` false: nothing is ever drawn.
@@ -19,9 +19,9 @@ class TerminalProgress {
   // Starts at 0 of `total`, and counts on to `done` of them; Tick draws it.
   void Begin(uint64_t total);
   void Done(uint64_t done);
-  // Draws the line when it is time to.
+  // Draws the line if it is time.
   void Tick();
-  // Takes the line away: before anything else goes to the terminal.
+  // Clears the line, before anything else is printed.
   void Clear();
 
  private:

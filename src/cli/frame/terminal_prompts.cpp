@@ -5,6 +5,7 @@
 #include "core/shown_text.h"
 #include "platform/process.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::cli {
 
@@ -18,12 +19,12 @@ std::string Trimmed(std::string_view line) {
   return std::string(line);
 }
 
-// What a letter says about a file whose name is taken.
+// What a letter means for a file whose name is taken.
 struct Choice {
-  char letter;  // its capital means: and so for all that follow
-  bool ok;      // false: the file is left out
+  char letter;  // as a capital: the same answer for the rest
+  bool ok;      // false: skip the file
   bool keepBoth;
-  bool recycle;  // the file that is there
+  bool recycle;  // the existing file
 };
 constexpr Choice kChoices[] = {
     {'r', true, false, false},
@@ -51,7 +52,7 @@ std::optional<OverwriteAnswer> Understand(const std::string& line, const Overwri
   return std::nullopt;
 }
 
-// Nothing is echoed while one of these is there.
+// Switches off the echo of typed text for its lifetime.
 class HiddenTyping {
  public:
   HiddenTyping() : hidden_(platform::ShowTyping(false)) {}
@@ -87,16 +88,16 @@ std::optional<std::string> TerminalPrompts::Ask(const std::string& question) {
 
 std::optional<std::string> TerminalPrompts::AskDestinationName(const NameQuestion& question) {
   const std::string problem = question.problem.empty() ? "" : question.problem + " ";
-  const auto line = Ask(problem + "Name of the output (empty: " + EscapeControls(question.path) + "; Ctrl-D: skip it):");
+  const auto line = Ask(problem + Tr("Name of the output (empty: %1; Ctrl-D: skip):", EscapeControls(question.path)));
   return line && line->empty() ? question.path : line;
 }
 
 OverwriteAnswer TerminalPrompts::AskOverwrite(const OverwriteQuestion& question) {
   const std::string problem = question.problem.empty() ? "" : question.problem + " ";
   for (;;) {
-    const auto line = Ask(problem + EscapeControls(question.path) +
-                          " exists. r: replace it, t: the same and move it to the trash, k: keep both, n NAME: another name, "
-                          "s: skip; capital: for all that follow.");
+    const auto line = Ask(problem + Tr("%1 exists. r: replace, t: replace, old file to the trash, k: keep both, n NAME: use another "
+                                       "name, s: skip; capital letter: same answer for the rest.",
+                                       EscapeControls(question.path)));
     if (!line) return {.ok = false, .checks = question.checks, .name = {}, .skipRest = true};
     auto answer = Understand(*line, question.checks);
     if (!answer) continue;
@@ -107,16 +108,17 @@ OverwriteAnswer TerminalPrompts::AskOverwrite(const OverwriteQuestion& question)
 
 std::optional<std::string> TerminalPrompts::AskPassword(const std::string& path) {
   const HiddenTyping hidden;
-  auto line = Ask("Password for " + EscapeControls(path) + ":");
+  auto line = Ask(Tr("Password for %1:", EscapeControls(path)));
   std::fputc('\n', context_.io.err);
   return line && line->empty() ? std::nullopt : line;
 }
 
 bool TerminalPrompts::ConfirmNewFolder(const std::string& folder) {
   for (;;) {
-    const auto line = Ask("There is no folder " + EscapeControls(folder) + ". Make it? y: yes, n: no.");
-    if (!line || *line == "n") return false;
-    if (line->empty() || *line == "y") return true;
+    // Translators: "y" and "n" may be other letters, one each; name them in this question, too.
+    const auto line = Ask(Tr("Folder \"%1\" does not exist. Create it? [%2/%3]", EscapeControls(folder), Tr("y"), Tr("n")));
+    if (!line || *line == "n" || *line == Tr("n")) return false;
+    if (line->empty() || *line == "y" || *line == Tr("y")) return true;
   }
 }
 

@@ -9,8 +9,8 @@
 
 namespace fotomill::cli {
 
-// Asks on the standard error and reads lines from the standard input. The end of the input, and Ctrl-C, are the answer that
-// changes nothing. What is answered about a file holds for that file or that run; it is never kept as a setting.
+// Asks on standard error and reads answers from standard input. End of input and Ctrl-C mean the answer that changes nothing.
+// Answers apply to that file or that run and are never stored as settings.
 class TerminalPrompts : public Prompts {
  public:
   TerminalPrompts(const CommandContext& context, ResultOutput& output) : context_(context), output_(output) {}
@@ -18,11 +18,11 @@ class TerminalPrompts : public Prompts {
   std::optional<std::string> AskDestinationName(const NameQuestion& question) override;
   OverwriteAnswer AskOverwrite(const OverwriteQuestion& question) override;
   std::optional<std::string> AskPassword(const std::string& path) override;
-  bool ConfirmFormat(const std::string&) override { return true; }  // the command line has named it
+  bool ConfirmFormat(const std::string&) override { return true; }  // named on the command line
   bool ConfirmNewFolder(const std::string& folder) override;
 
  private:
-  // Prints a question and reads the line typed behind it, without its end and blanks around it; nullopt when there is none.
+  // Prints a question and reads the answer, without line end and surrounding blanks; nullopt at the end of input.
   std::optional<std::string> Ask(const std::string& question);
 
   const CommandContext& context_;

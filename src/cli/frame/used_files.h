@@ -10,8 +10,8 @@
 
 namespace fotomill::cli {
 
-// What a command did to files, gathered while it runs and recorded in the file history when it ends. A history that
-// cannot be written is no failure of the command.
+// The files a command used, collected while it runs and recorded in the file history at its end. Failing to write the
+// history is not a failure of the command.
 class UsedFiles {
  public:
   // Without a function nothing is recorded.
@@ -22,7 +22,7 @@ class UsedFiles {
     if (!uses_.empty()) (void)UpdateFileHistory(HistoryOptionsFromSettings(), uses_);
   }
 
-  // The command has just dealt with that file.
+  // Adds a file that the command has just processed.
   void Add(const std::string& name);
 
  private:

@@ -27,7 +27,7 @@ void OrderedRun::Run(size_t count, uint32_t jobs) {
     if (threaded_) DeliverAll();
     threaded_ = false;
   }
-  // Also what is left where no worker could go on.
+  // Also what is left where no worker could continue.
   for (size_t item = begun_; item < count && steps_.goesOn(); ++item) {
     const Status status = Guarded([&] { return steps_.work(item); });
     steps_.deliver(item, status);
@@ -81,7 +81,7 @@ void OrderedRun::WorkOnOne() {
   if (item == head_ || workers_ == 0) delivered_.notify_one();
 }
 
-// Has workers go on that waited for deliveries. Locked.
+// Has workers continue that waited for deliveries. Locked.
 void OrderedRun::ResumeWorkers() {
   if (begun_ >= head_ + steps_.ahead) return;
   workers_ -= parked_;

@@ -11,7 +11,7 @@
 
 namespace fotomill {
 
-// Work on numbered items that goes on on several threads of the pool and looks from outside as if it were done one item after the
+// Work on numbered items that runs on several threads of the pool and looks from outside as if it were done one item after the
 // other.
 class OrderedRun {
  public:

@@ -91,7 +91,7 @@ class WorkerPool {
 // the same by itself. They begin and leave at any time: where the pool is busy with tasks, nobody comes.
 class Helpers {
  public:
-  // `step` does a piece of the work, on up to `most` threads at once; false when there is none left to begin.
+  // `step` does a piece of the work, on up to `most` threads at once; false if there is none left to begin.
   Helpers(WorkerPool& pool, unsigned most, std::function<bool()> step);
   // No further step begins; waits for those that have.
   ~Helpers();

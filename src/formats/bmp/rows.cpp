@@ -1,6 +1,7 @@
 #include "formats/rows.h"
 
 #include "formats/bmp/bmp.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -13,8 +14,8 @@ constexpr Signature kSignatures[] = {
     {0, "BA"sv, {}, 14, "BM"sv},  // the first picture of an OS/2 bitmap array
 };
 
-constexpr FormatSetting kKeys[] = {{"WriteOS2Bitmaps", "Bitmaps (BMP): write the OS/2 form"}};
-constexpr FormatSettings kSettings = {"BMP", "OverrideBmpBox", "Other formats", kKeys};
+constexpr FormatSetting kKeys[] = {{"WriteOS2Bitmaps", TrLater("Bitmaps (BMP): OS/2 version")}};
+constexpr FormatSettings kSettings = {"BMP", "OverrideBmpBox", TrLater("Other formats"), kKeys};
 
 constexpr FormatEntry Row(std::string_view extension, std::string_view description, DetailsOperation details) {
   return {.details = details,

@@ -41,8 +41,8 @@ class CodeReader {
   uint32_t held_ = 0;
 };
 
-// Where the string of a code stands in the pixels decoded so far. A new string is the one before and the pixel behind it,
-// and just so it stands there already.
+// The position of a code's string in the decoded pixels. A new string is the previous one plus its next pixel, which the output
+// already contains.
 struct DecodedString {
   uint64_t start;
   uint32_t length;

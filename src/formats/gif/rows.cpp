@@ -1,6 +1,7 @@
 #include "formats/rows.h"
 
 #include "formats/gif/gif.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -11,12 +12,12 @@ using namespace std::string_view_literals;
 constexpr Signature kSignatures[] = {{0, "GIF87a"sv, "GIF"}, {0, "GIF89a"sv, "GIF"}};
 
 constexpr FormatSetting kKeys[] = {
-    {"WriteGIFInterlaced", "Interlaced"},
-    {"CreateGif89", "Version 89a, with comments and transparency"},
+    {"WriteGIFInterlaced", TrLater("Interlaced")},
+    {"CreateGif89", TrLater("Version 89a, with comments and transparency")},
     {"FXColorDither"},
     {"FXBidirectional"},
 };
-constexpr FormatSettings kSettings = {"GIF", "OverrideGifBox", "GIF", kKeys};
+constexpr FormatSettings kSettings = {"GIF", "OverrideGifBox", TrLater("GIF"), kKeys};
 
 constexpr FormatEntry kRows[] = {{
     .details = GifDetails,

@@ -1,6 +1,7 @@
 #include "formats/rows.h"
 
 #include "formats/hdphoto/hdp.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -11,13 +12,13 @@ using namespace std::string_view_literals;
 constexpr Signature kSignatures[] = {{0, "II\xbc\x01"sv, "JPEG XR"}};
 
 constexpr FormatSetting kKeys[] = {
-    {"HDPCompression", "Compression, 0 loses nothing to 255 smallest"},
+    {"HDPCompression", TrLater("Compression, 0 (lossless) to 255 (smallest)")},
     {"TiffResolution"},
 };
-constexpr FormatSettings kSettings = {"HDP", "OverrideHdpBox", "HD Photo", kKeys};
+constexpr FormatSettings kSettings = {"HDP", "OverrideHdpBox", TrLater("HD Photo"), kKeys};
 
 std::string JxrVersion() { return HdpWorksHere() ? "present" : "missing"; }
-constexpr FormatLibrary kLibraries[] = {{"libjxr", JxrVersion, "HD Photo, loaded when needed"}};
+constexpr FormatLibrary kLibraries[] = {{"libjxr", JxrVersion, TrLater("HD Photo, loaded when needed")}};
 
 constexpr uint32_t kFlags = FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_FRAMES | FMT_LAYERED;
 
@@ -35,7 +36,7 @@ constexpr FormatEntry Row(std::string_view extension, std::string_view descripti
           .canRead = true,
           .canWrite = true,
           .present = HdpWorksHere,
-          .whyNot = "The library libjxr is not installed.",
+          .whyNot = TrLater("The library libjxr is not installed."),
           .signatures = kSignatures,
           .keepsMetadata = kAllMetadata,
           .hasOptionsBox = hasOptionsBox,

@@ -1,6 +1,7 @@
 #include "formats/rows.h"
 
 #include "formats/icon/ico.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -10,11 +11,11 @@ using namespace std::string_view_literals;
 
 // Either row reads both kinds of file.
 constexpr std::string_view kIcon = "\0\0\1\0"sv, kCursor = "\0\0\2\0"sv;
-constexpr Signature kIconSignatures[] = {{0, kIcon, "an icon"}, {0, kCursor}};
-constexpr Signature kCursorSignatures[] = {{0, kCursor, "a cursor"}, {0, kIcon}};
+constexpr Signature kIconSignatures[] = {{0, kIcon, TrLater("an icon")}, {0, kCursor}};
+constexpr Signature kCursorSignatures[] = {{0, kCursor, TrLater("a cursor")}, {0, kIcon}};
 
-constexpr FormatSetting kKeys[] = {{"ICOCompression", "Icons (ICO): compression"}};
-constexpr FormatSettings kSettings = {"ICO", "OverrideIcoBox", "Other formats", kKeys};
+constexpr FormatSetting kKeys[] = {{"ICOCompression", TrLater("Icons (ICO): compression")}};
+constexpr FormatSettings kSettings = {"ICO", "OverrideIcoBox", TrLater("Other formats"), kKeys};
 
 constexpr FormatEntry Row(std::string_view extension, std::string_view description, uint32_t flags,
                           std::span<const Signature> signatures, bool hasOptionsBox) {

@@ -16,6 +16,7 @@
 
 #include "core/limits.h"
 #include "formats/jpeg/jpeg_library.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -89,8 +90,8 @@ void Measure(JpegTurner& turner, Turn turn, bool trim, TurnedJpeg& turned) {
   turner.height = old.image_height - restDown;
   turned.trimmed = restAcross > 0 || restDown > 0;
   if (turned.trimmed && (!trim || turner.width == 0 || turner.height == 0)) {
-    turned.obstacle = "Its size is no multiple of its blocks of " + std::to_string(pieceWidth) + " x " +
-                      std::to_string(pieceHeight) + " pixels.";
+    turned.obstacle =
+        TrRecorded("The size is not a multiple of the block size of %1 x %2 pixels.", pieceWidth, pieceHeight);
   }
   turned.width = static_cast<int32_t>(turn.swap ? turner.height : turner.width);
   turned.height = static_cast<int32_t>(turn.swap ? turner.width : turner.height);
@@ -131,7 +132,7 @@ Status ReadBlocks(JpegTurner& turner, std::span<const uint8_t> file, TurnedJpeg&
   if (!read) return reader.Failure();
   if (reader.errors.cutShort && reader.errors.endMissing) return Status::FileReadError;
   turned.end = file.size() - reader.info.src->bytes_in_buffer;
-  if (reader.errors.base.num_warnings > 0) turned.obstacle = "It is damaged, though it can be shown.";
+  if (reader.errors.base.num_warnings > 0) turned.obstacle = TrRecorded("The file is damaged, although it can be shown.");
   return Status::Ok;
 }
 
@@ -216,14 +217,14 @@ Status TurnJpeg(std::span<const uint8_t> file, Orientation orientation, bool tri
   JpegTurner turner;
   RETURN_IF_BAD(ReadJpegHeader(turner.reader, file));
   Measure(turner, turn, trim, turned);
-  if (turned.obstacle.empty() && !LayOut(turner, turn)) turned.obstacle = "It is too large for that.";
+  if (turned.obstacle.empty() && !LayOut(turner, turn)) turned.obstacle = TrRecorded("The picture is too large.");
   if (!turned.obstacle.empty()) return Status::Ok;
   RETURN_IF_BAD(ReadBlocks(turner, file, turned));
   if (!turned.obstacle.empty()) return Status::Ok;
   const Status status = WriteTurned(turner, turn);
   if (status == Status::Ok) turned.file.assign(turner.bytes, turner.bytes + turner.size);
   if (status != Status::UnsuitableImage) return status;
-  turned.obstacle = "Its kind of JPEG cannot be written again as it is.";
+  turned.obstacle = TrRecorded("This kind of JPEG cannot be rewritten losslessly.");
   return Status::Ok;
 }
 

@@ -8,6 +8,7 @@
 
 #include "core/status.h"
 #include "processing/geometry/orient.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -17,7 +18,7 @@ struct TurnedJpeg {
   int32_t width = 0, height = 0;  // of the turned picture
   bool trimmed = false;           // edges were cut off
   size_t end = 0;                 // where the picture ends in the old file; other bytes may follow
-  std::string obstacle;           // why it cannot be turned so without a loss, as a sentence; the picture itself is sound
+  RecordedText obstacle;          // why it cannot be turned losslessly, as a sentence; the picture itself is sound
 };
 
 // Turns the picture of a JPEG file. Edges move only in whole blocks (8 pixels, 16 where colors are stored at half the size):

@@ -3,6 +3,7 @@
 #include <jconfig.h>
 
 #include "formats/jpeg/jpeg.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -13,19 +14,19 @@ using namespace std::string_view_literals;
 constexpr Signature kSignatures[] = {{0, "\xff\xd8\xff"sv, "JPEG"}};
 
 constexpr FormatSetting kKeys[] = {
-    {"JpegCompression", "Quality"},
-    {"JpegSubsample", "Share colors of neighbors"},
-    {"WriteJpegProgressive", "Progressive"},
-    {"JpegStoreDPI", "Store the resolution"},
+    {"JpegCompression", TrLater("Quality")},
+    {"JpegSubsample", TrLater("Chroma subsampling")},
+    {"WriteJpegProgressive", TrLater("Progressive")},
+    {"JpegStoreDPI", TrLater("Store the resolution")},
     {"TiffResolution"},
     {"AlphaBackground"},
 };
-constexpr FormatSettings kSettings = {"JPG", "OverrideJpgBox", "JPEG", kKeys};
+constexpr FormatSettings kSettings = {"JPG", "OverrideJpgBox", TrLater("JPEG"), kKeys};
 
 #define FOTOMILL_QUOTED(text) #text
 #define FOTOMILL_QUOTED_VALUE(macro) FOTOMILL_QUOTED(macro)
 std::string TurboVersion() { return FOTOMILL_QUOTED_VALUE(LIBJPEG_TURBO_VERSION); }
-constexpr FormatLibrary kLibraries[] = {{"libjpeg-turbo", TurboVersion, "JPEG"}};
+constexpr FormatLibrary kLibraries[] = {{"libjpeg-turbo", TurboVersion, TrLater("JPEG")}};
 
 constexpr FormatEntry Row(std::string_view extension, std::string_view description, int32_t enabled, uint32_t flags) {
   const bool first = (flags & FMT_SECONDARY) == 0;

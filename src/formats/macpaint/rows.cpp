@@ -1,6 +1,7 @@
 #include "formats/rows.h"
 
 #include "formats/macpaint/mac.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -9,11 +10,11 @@ namespace {
 using namespace std::string_view_literals;
 
 constexpr FormatSetting kKeys[] = {
-    {"CreateMacbinaryHeader", "MacPaint (MAC): put a MacBinary header in front"},
+    {"CreateMacbinaryHeader", TrLater("MacPaint (MAC): add a MacBinary header")},
     {"FXMonoDither"},
     {"FXThreshold"},
 };
-constexpr FormatSettings kSettings = {"MAC", "OverrideMacBox", "Other formats", kKeys};
+constexpr FormatSettings kSettings = {"MAC", "OverrideMacBox", TrLater("Other formats"), kKeys};
 
 constexpr FormatEntry kRows[] = {{
     .info = MacInfo,

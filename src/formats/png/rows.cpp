@@ -5,6 +5,7 @@
 #include <zlib.h>
 
 #include "formats/png/png.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -14,16 +15,16 @@ using namespace std::string_view_literals;
 
 constexpr Signature kSignatures[] = {{0, "\x89PNG\r\n\x1a\n"sv, "PNG"}};
 
-constexpr FormatSetting kKeys[] = {{"PngCompression", "Compression, 0 fastest to 9 smallest"}};
-constexpr FormatSettings kSettings = {"PNG", "OverridePngBox", "PNG", kKeys};
+constexpr FormatSetting kKeys[] = {{"PngCompression", TrLater("Compression, 0 (fastest) to 9 (smallest)")}};
+constexpr FormatSettings kSettings = {"PNG", "OverridePngBox", TrLater("PNG"), kKeys};
 
 std::string PngVersion() { return PNG_LIBPNG_VER_STRING; }
 std::string ZlibVersion() { return zlibVersion(); }
 std::string DeflateVersion() { return LIBDEFLATE_VERSION_STRING; }
 constexpr FormatLibrary kLibraries[] = {
-    {"libpng", PngVersion, "PNG"},
-    {"zlib", ZlibVersion, "PNG"},
-    {"libdeflate", DeflateVersion, "PNG and TIFF"},
+    {"libpng", PngVersion, TrLater("PNG")},
+    {"zlib", ZlibVersion, TrLater("PNG")},
+    {"libdeflate", DeflateVersion, TrLater("PNG and TIFF")},
 };
 
 constexpr FormatEntry kRows[] = {{

@@ -1,6 +1,7 @@
 #include "formats/rows.h"
 
 #include "formats/targa/tga.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -8,8 +9,8 @@ namespace {
 
 using namespace std::string_view_literals;
 
-constexpr FormatSetting kKeys[] = {{"CreateTarga16", "Targa (TGA): 16 bits a pixel"}};
-constexpr FormatSettings kSettings = {"TGA", "OverrideTgaBox", "Other formats", kKeys};
+constexpr FormatSetting kKeys[] = {{"CreateTarga16", TrLater("Targa (TGA): 16 bits per pixel")}};
+constexpr FormatSettings kSettings = {"TGA", "OverrideTgaBox", TrLater("Other formats"), kKeys};
 
 constexpr FormatEntry kRows[] = {{
     .info = TgaInfo,

@@ -3,6 +3,7 @@
 #include <tiffio.h>
 
 #include "formats/tiff/tiff.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -17,8 +18,8 @@ constexpr Signature kSignatures[] = {
     {0, "MM\0\x2b"sv, "TIFF"},
 };
 
-constexpr FormatSetting kKeys[] = {{"TiffOptions", "Compression"}, {"TiffResolution"}, {"JpegCompression"}};
-constexpr FormatSettings kSettings = {"TIF", "OverrideTifBox", "TIFF", kKeys};
+constexpr FormatSetting kKeys[] = {{"TiffOptions", TrLater("Compression")}, {"TiffResolution"}, {"JpegCompression"}};
+constexpr FormatSettings kSettings = {"TIF", "OverrideTifBox", TrLater("TIFF"), kKeys};
 
 // The number in "LIBTIFF, Version 4.5.0" and a copyright line.
 std::string TiffVersion() {
@@ -26,7 +27,7 @@ std::string TiffVersion() {
   const size_t start = text.find_first_of("0123456789");
   return start == std::string::npos ? text : text.substr(start, text.find('\n', start) - start);
 }
-constexpr FormatLibrary kLibraries[] = {{"libtiff", TiffVersion, "TIFF"}};
+constexpr FormatLibrary kLibraries[] = {{"libtiff", TiffVersion, TrLater("TIFF")}};
 
 constexpr FormatEntry kRows[] = {{
     .details = TiffDetails,

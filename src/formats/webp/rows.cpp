@@ -3,6 +3,7 @@
 #include <webp/decode.h>
 
 #include "formats/webp/webp.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -13,17 +14,17 @@ using namespace std::string_view_literals;
 constexpr Signature kSignatures[] = {{0, "RIFF"sv, "WebP", 8, "WEBP"sv}};
 
 constexpr FormatSetting kKeys[] = {
-    {"WebPLossless", "Lose nothing"},
-    {"WebPQualityFactor", "Quality"},
-    {"WebPAllowMixed", "Try both ways and keep the smaller file"},
+    {"WebPLossless", TrLater("Lossless")},
+    {"WebPQualityFactor", TrLater("Quality")},
+    {"WebPAllowMixed", TrLater("Try both and keep the smaller file")},
 };
-constexpr FormatSettings kSettings = {"WEBP", "OverrideWebPBox", "WebP", kKeys};
+constexpr FormatSettings kSettings = {"WEBP", "OverrideWebPBox", TrLater("WebP"), kKeys};
 
 std::string WebpVersion() {
   const int version = WebPGetDecoderVersion();
   return std::to_string(version >> 16) + "." + std::to_string(version >> 8 & 255) + "." + std::to_string(version & 255);
 }
-constexpr FormatLibrary kLibraries[] = {{"libwebp", WebpVersion, "WebP"}};
+constexpr FormatLibrary kLibraries[] = {{"libwebp", WebpVersion, TrLater("WebP")}};
 
 constexpr FormatEntry kRows[] = {{
     .info = WebpInfo,

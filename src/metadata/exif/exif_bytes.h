@@ -86,7 +86,7 @@ struct ExifField {
   uint16_t type = 0;
   uint32_t count = 0;
   uint64_t entryOffset = 0;  // of the entry itself
-  uint64_t valueOffset = 0;  // of its first value, which may lie beyond the block
+  uint64_t valueOffset = 0;  // of its first value, which may be beyond the block
   uint64_t ValueSize() const { return uint64_t{count} * ExifStoredSize(type); }
 };
 

@@ -37,7 +37,7 @@ struct Range {
   uint64_t begin, end;
 };
 
-// One directory: as many of its entries as lie in the block.
+// One directory: as many of its entries as are in the block.
 struct Directory {
   uint64_t offset = 0;
   uint32_t count = 0;

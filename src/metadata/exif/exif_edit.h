@@ -23,12 +23,12 @@ struct ExifPictureFacts {
 void SetExifPictureFacts(std::span<uint8_t> block, const ExifPictureFacts& facts);
 
 // Sets the orientation, also where the block does not tell one: its first directory moves to the end of the block then, with an
-// entry more, and an empty block becomes one that tells nothing else. False, with the block as it was, where it has no TIFF
+// entry more, and an empty block becomes one that tells nothing else. False, with the block unchanged, where it has no TIFF
 // header or no first directory.
 [[nodiscard]] bool PutExifOrientation(std::vector<uint8_t>& block, int32_t orientation);
 
 // Takes the thumbnail out: the chain ends behind the first directory; the directories behind it, their values and the
-// thumbnail are overwritten with zeros, as far as nothing else lies there, and cut off where they end the block.
+// thumbnail are overwritten with zeros, as far as nothing else is there, and cut off where they end the block.
 void DropExifThumbnail(std::vector<uint8_t>& block);
 
 // Puts the JPEG stream `thumbnail` in the place of the block's thumbnail, if any, with a second directory of its own at

@@ -43,7 +43,7 @@ class ExifSource {
   Status Take(const char* path, const Place& place);
 
   platform::FileView file_;     // the head, or the whole of a TIFF file
-  platform::MemoryBlock copy_;  // a block that does not lie in the head, or was gathered
+  platform::MemoryBlock copy_;  // a block that is not in the head, or was gathered
   std::span<const uint8_t> block_;
 };
 

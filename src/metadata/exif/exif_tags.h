@@ -79,14 +79,14 @@ inline constexpr int32_t kNoExifTag = -1;
 // The dictionary in the order in which the editor offers it; each tag number stands in it once.
 // Source: CIPA DC-008-2012, "Exchangeable image file format for digital still cameras: Exif Version 2.3".
 std::span<const ExifTag> ExifTags();
-// Row of a tag, by number alone: GPS tags and the others do not clash. Null, or kNoExifTag, when there is none.
+// Row of a tag, by number alone: GPS tags and the others do not clash. Null, or kNoExifTag, if there is none.
 const ExifTag* FindExifTag(uint16_t tag);
 int32_t ExifTagIndex(uint16_t tag);
 // The display name; "Unknown" for a tag without a row.
 std::string_view ExifTagName(uint16_t tag);
 // A copy of the row; for a tag without one, a plain row with the name "Unknown" and the number filled in.
 ExifTag CopyExifTag(uint16_t tag);
-// The editor's bounds, both 0 when there are none, and the edit class, 0 for a tag without a row.
+// The editor's bounds, both 0 if there are none, and the edit class, 0 for a tag without a row.
 struct ExifRange {
   int32_t minimum = 0, maximum = 0;
 };

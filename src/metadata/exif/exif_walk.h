@@ -42,8 +42,8 @@ struct ExifFindings {
 bool WalkExif(std::span<const uint8_t> block, ExifSink* sink, ExifFindings* findings = nullptr,
               int32_t only = kAllExifDirectories);
 
-// The embedded thumbnail that a walk found, a JPEG stream, as a part of the block. Empty when there is none or when it
-// does not lie in the block as a whole.
+// The embedded thumbnail that a walk found, a JPEG stream, as a part of the block. Empty if there is none or when it
+// is not in the block as a whole.
 std::span<const uint8_t> ExifThumbnail(std::span<const uint8_t> block, const ExifFindings& findings);
 
 }  // namespace fotomill

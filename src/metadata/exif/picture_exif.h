@@ -6,7 +6,7 @@
 
 namespace fotomill {
 
-// How a picture has to be turned to stand upright, as its EXIF block says.
+// How a picture has to be turned to be upright, as its EXIF block says.
 Orientation OrientationOf(const PictureRecord& picture);
 
 // Turns a picture, and what its EXIF block and XMP packet say of it: the orientation becomes 1, and a thumbnail of the old

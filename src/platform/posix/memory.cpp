@@ -90,7 +90,7 @@ void ShrinkPool(uint64_t bytes) {
   }
 }
 
-// The smallest pooled block that is large enough without being wasteful; data is null when there is none.
+// The smallest pooled block that is large enough without being wasteful; data is null if there is none.
 FreeBlock TakeFromPool(uint64_t capacity) {
   const std::lock_guard lock(pool.mutex);
   size_t best = pool.count;

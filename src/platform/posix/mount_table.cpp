@@ -80,7 +80,7 @@ std::string LinkTarget(const std::string& path) {
   return length > 0 ? std::string(target, static_cast<size_t>(length)) : std::string();
 }
 
-// The kernel's name of the device below a mount ("sda1"), empty when there is none.
+// The kernel's name of the device below a mount ("sda1"), empty if there is none.
 std::string DeviceName(const Mount& mount, const std::string& root) {
   const std::string known = LinkTarget(root + "/sys/dev/block/" + mount.device);
   if (!known.empty()) return std::string(FileNameOf(known));
@@ -89,7 +89,7 @@ std::string DeviceName(const Mount& mount, const std::string& root) {
   return std::string(FileNameOf(real != nullptr ? real.get() : mount.source));
 }
 
-// The name in a folder of links, decoded, whose link leads to the device; empty when there is none.
+// The name in a folder of links, decoded, whose link leads to the device; empty if there is none.
 std::string NameAmong(const std::string& folder, const std::string& device) {
   const auto entries = ListFolder(folder);
   if (!entries || device.empty()) return {};

@@ -57,7 +57,7 @@ bool NameUnnamed(int handle, const std::string& path) {
   return linkat(AT_FDCWD, HandlePath(handle).c_str(), AT_FDCWD, path.c_str(), AT_SYMLINK_FOLLOW) == 0;
 }
 
-// Has the system report errors that it keeps for the closing of a file, while the file stays open.
+// Reports errors that the kernel delays until close(), without closing the file.
 bool CloseCopyOf(int handle) {
   Handle copy(fcntl(handle, F_DUPFD_CLOEXEC, 0));
   return copy.IsOpen() && copy.Reset();

@@ -43,7 +43,7 @@ void OnTermination(int signalNumber) {
 
 bool IsProgram(const std::string& path) { return IsRegularFile(path) && access(path.c_str(), X_OK) == 0; }
 
-// The file of a program given by name or path; empty when there is none.
+// The file of a program given by name or path; empty if there is none.
 std::string FindProgram(const std::string& name) {
   if (name.find('/') != std::string::npos) return IsProgram(name) ? name : std::string();
   const char* path = std::getenv("PATH");
@@ -145,6 +145,8 @@ bool ShowTyping(bool show) {
   modes.c_lflag = show ? modes.c_lflag | ECHO : modes.c_lflag & ~static_cast<tcflag_t>(ECHO);
   return tcsetattr(STDIN_FILENO, TCSAFLUSH, &modes) == 0;
 }
+
+void SetVariable(const char* name, const std::string& value) { (void)setenv(name, value.c_str(), 1); }
 
 int TerminalWidth() {
   for (const int stream : {STDERR_FILENO, STDOUT_FILENO}) {

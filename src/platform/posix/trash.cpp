@@ -50,7 +50,7 @@ struct Victim {
 struct Place {
   std::string folder;
   std::string remembered;
-  bool shared = false;  // lies on a volume that others may write to: must be ours and no link
+  bool shared = false;  // is on a volume that others may write to: must be ours and no link
 };
 
 // Folders made on the way, taken away again unless the work succeeds.
@@ -112,7 +112,7 @@ bool IsOnDevice(const std::string& path, dev_t device) {
   return stat(path.c_str(), &facts) == 0 && facts.st_dev == device;
 }
 
-// The top folder of the volume that a folder without links lies on.
+// The top folder of the volume that a folder without links is on.
 std::string TopFolder(std::string folder, dev_t device) {
   while (folder.size() > 1) {
     std::string above = AbsolutePath(folder + "/..");

@@ -58,7 +58,7 @@ Volume AskSystem(const std::string& path) {
     const bool holdsFile = idKnown ? mount.id == facts.stx_mnt_id : mount.device == device;
     if (holdsFile) return DescribeMount(mount, volume.serial, "");
   }
-  volume.kind = DriveKind::Fixed;  // below a changed root the table lacks the volume that the root lies on
+  volume.kind = DriveKind::Fixed;  // below a changed root the table lacks the volume that the root is on
   return volume;
 }
 

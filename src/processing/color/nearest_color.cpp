@@ -21,7 +21,7 @@ int32_t Distance(const Point& a, const Point& b) {
 //
 // Whether color j beats color m at a point depends on the difference of the two distances, which is linear in the
 // point: at its most favourable corner it is the middle's difference less twice the weighed half width per channel
-// times how far the two colors lie apart there.
+// times how far the two colors are apart there.
 int32_t PickCandidates(const ColorPoints& points, const uint8_t* from, int32_t count, const Point& corner, int32_t width,
                        uint8_t* picked) {
   const int32_t half = (width - 1) * ColorPoints::kUnits / 2;
@@ -123,7 +123,7 @@ uint32_t NearestColor::FillFine(uint32_t cell) {
   return fine_[cell] = list[0] | (count > 1 ? StoreGroups(list, (static_cast<uint32_t>(count) + 3) / 4) << 8 : 0);
 }
 
-// Stores a list of colors in groups of four and returns its place, 0 when there is no room.
+// Stores a list of colors in groups of four and returns its place, 0 if there is no room.
 uint32_t NearestColor::StoreGroups(const uint8_t* list, uint32_t groups) {
   const uint32_t place = groupsUsed_;
   if (place + groups > kMostGroups) return 0;

@@ -15,7 +15,7 @@ namespace fotomill {
 // one between those. Two Gaussians make one of the sum of their variances; as d is small beside them, what the coarse
 // grid adds is below 1/50 of a level.
 
-// Where a part of a picture that is computed alone lies in the whole: makes the grid the same in both.
+// Where a part of a picture that is computed alone is in the whole: makes the grid the same in both.
 struct GaussianPlace {
   int32_t left = 0, top = 0;
 };
@@ -24,7 +24,7 @@ struct GaussianPlace {
 int32_t GaussianReach(double sigma);
 
 // Blurs a picture; the result has 24 bits. Alpha is blurred as well. Sigma from 0.1 to 1000. Statuses: EmptyImage,
-// MemoryAllocationError, FunctionCancelled; the picture is then as it was, or promoted.
+// MemoryAllocationError, FunctionCancelled; the picture is then unchanged, or promoted.
 Status BlurPicture(PictureRecord& picture, double sigma, const GaussianPlace& place, const Work& work);
 
 // v + amount (v - blur) where |v - blur| >= threshold levels, else v; the blur is not rounded. `amount` 1 is 100 %.

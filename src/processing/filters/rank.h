@@ -18,7 +18,7 @@ inline constexpr int32_t kMostRankRadius = 127;
 
 // Replaces the picture; the result has 24 bits. Radius 0 to kMostRankRadius. The cost of a median does not depend on the
 // radius, that of the others grows with its logarithm. Statuses: EmptyImage, MemoryAllocationError, FunctionCancelled; the
-// picture is then as it was, or promoted.
+// picture is then unchanged, or promoted.
 Status RankPicture(PictureRecord& picture, Rank rank, int32_t radius, const Work& work);
 
 }  // namespace fotomill

@@ -7,7 +7,7 @@
 
 namespace fotomill {
 
-// How a stored picture must be turned to stand upright: the values of EXIF's Orientation tag (0x0112), which name where
+// How a stored picture must be turned to be upright: the values of EXIF's Orientation tag (0x0112), which name where
 // the stored row 0 and column 0 belong.
 enum class Orientation : int32_t {
   Upright = 1,       // top, left

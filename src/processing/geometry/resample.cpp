@@ -271,7 +271,7 @@ class Resampling {
     }
   }
 
-  // The rows of a window. Those without weight that would lie behind the last row are the last row.
+  // The rows of a window. Those without weight that would be behind the last row are the last row.
   template <typename Sample, typename RowAt>
   const Sample* const* RowsOf(const FilterWindow& window, RowAt rowAt) {
     const Sample** rows = pointers_.Items<const Sample*>().data();

@@ -70,7 +70,7 @@ Group MakeGroup(std::span<const ColorBin> bins, size_t begin, size_t end) {
   return group;
 }
 
-// Cuts the group in two at its mean; false when all its bins lie on one side.
+// Cuts the group in two at its mean; false when all its bins are on one side.
 bool Split(std::span<ColorBin> bins, Group& group, Group& other) {
   const auto first = bins.begin() + static_cast<std::ptrdiff_t>(group.begin);
   const auto last = bins.begin() + static_cast<std::ptrdiff_t>(group.end);

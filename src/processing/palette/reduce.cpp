@@ -20,9 +20,9 @@ constexpr int kRefinements = 3;              // rounds in which the pixels thems
 constexpr int64_t kRefinedPixels = 200'000;  // about as many pixels take part
 constexpr int32_t kFewCells = 1024;          // a picture of fewer cells of colors has its colors counted one by one
 
-// Sixteenths of its error that a pixel hands on. All of it keeps the mean of black and white. A palette that was fitted
-// to the picture does not reach its outermost colors, and errors that it can never make up for would grow into noise;
-// less is handed on there, the less the closer the colors lie.
+// Share of the quantization error that is diffused, in sixteenths. All of it preserves the mean of black and white. A palette
+// fitted to the picture does not reach its outermost colors, and errors that can never be compensated would grow into noise;
+// less is diffused there, the less the closer the colors are.
 constexpr int32_t kHandedOnMono = 16, kHandedOnFew = 12, kHandedOnMany = 10;
 constexpr int32_t kFew = 16;  // colors
 

@@ -28,7 +28,7 @@ struct ReduceOptions {
   int32_t contrast = 0;    // spread about middle gray before that, -100 (all gray) to 100 per cent (doubled)
 };
 
-// Brings a picture down to at most `maxBits`: to 8, 4 or 1 bits a pixel, whichever is the deepest that fits, and leaves
+// Brings a picture down to at most `maxBits`: to 8, 4 or 1 bits per pixel, whichever is the deepest that fits, and leaves
 // `image`, `palette` and `bitsPerPixel` consistent. A picture that fits already stays as it is. Alpha is flattened first.
 // Where the picture uses few enough colors, they are kept exactly and nothing is dithered; otherwise a palette is fitted
 // to the picture (black and white for 1 bit) and the pixels are dithered as the options say. Without a picture:

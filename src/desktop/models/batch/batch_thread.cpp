@@ -7,6 +7,7 @@
 #include "platform/files.h"
 #include "processing/geometry/scale.h"
 #include "settings/job_options.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -15,10 +16,10 @@ namespace {
 constexpr int32_t kPreviewSide = 200;
 
 std::string DimensionsText(int32_t width, int32_t height, int32_t bits) {
-  return std::to_string(width) + " x " + std::to_string(height) + ", " + std::to_string(bits) + " bits";
+  return Tr("%1 x %2, %3 bits", width, height, bits);
 }
 
-// A copy of a picture that belongs to somebody else, scaled to a square.
+// A copy of a picture that another thread owns, scaled to a square.
 RgbImage SmallCopy(const PictureRecord& picture, int32_t side, Color matte) {
   PackedImage scaled, alpha;
   RgbImage rgb;
@@ -48,7 +49,7 @@ OverwritePreview MakeOverwritePreview(const OverwriteQuestion& question, int32_t
   const PictureRecord& incoming = *question.picture;
   if (!incoming.image.Empty()) preview.incoming = SmallCopy(incoming, side, options.matte);
   const platform::FileFacts source = platform::FactsOf(question.source);
-  preview.incomingText.append("From ").append(SizeText(source.size, choice::kSizeFitting)).append("\n");
+  preview.incomingText.append(Tr("From %1", SizeText(source.size, choice::kSizeFitting))).append("\n");
   preview.incomingText.append(DateText(source.modified)).append("\n");
   preview.incomingText += DimensionsText(incoming.width, incoming.height, incoming.bitsPerPixel);
   return preview;
@@ -111,7 +112,7 @@ class BatchThread::Questions : public Prompts {
     return confirmed;
   }
   bool ConfirmNewFolder(const std::string& folder) override {
-    return Confirm(std::string("There is no folder \"").append(folder).append("\". Make it?"), "&Make it");
+    return Confirm(Tr("Folder \"%1\" does not exist. Create it?", folder), Tr("&Create"));
   }
 
  private:

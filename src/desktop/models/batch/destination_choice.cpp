@@ -7,6 +7,7 @@
 #include "platform/paths.h"
 #include "registry/registry.h"
 #include "settings/history_list.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -43,11 +44,11 @@ std::vector<std::string> RecentDestinations() {
 
 std::string DestinationProblem(const DestinationChoice& choice) {
   const int32_t row = RowOf(choice.extension);
-  if (row == kNoFormat || !CanWrite(FormatRow(row))) return "The format cannot be written.";
+  if (row == kNoFormat || !CanWrite(FormatRow(row))) return Tr("The format cannot be written.");
   if (choice.folder.empty()) return {};
-  if (choice.folder.size() > PathText::Capacity()) return "The path of the folder is longer than 260 characters.";
+  if (choice.folder.size() > PathText::Capacity()) return Tr("The path of the folder is longer than 260 characters.");
   if (platform::FileExists(choice.folder) && !platform::IsFolder(choice.folder))
-    return "\"" + choice.folder + "\" is not a folder.";
+    return Tr("\"%1\" is not a folder.", choice.folder);
   return {};
 }
 

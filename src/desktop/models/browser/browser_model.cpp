@@ -10,6 +10,7 @@
 #include "core/text.h"
 #include "platform/clock.h"
 #include "platform/paths.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -227,39 +228,35 @@ std::string BrowserModel::CountText() const {
     if (selection_.SelectedCount() == 0) bytes += items_[item].size;
   }
   for (const size_t line : selection_.SelectedLines()) bytes += Line(line).size;
-  const auto count = [](size_t number, const char* what) {
-    return WithThousands(number) + " " + what + (number == 1 ? "" : "s");
-  };
-  std::string text = count(files, "file");
-  if (folders > 0) text += ", " + count(folders, "folder");
-  if (lines_.size() < items_.size()) text += " of " + WithThousands(items_.size());
-  if (selection_.SelectedCount() > 0) text += ", " + WithThousands(selection_.SelectedCount()) + " selected";
-  if (files > 0) text += ", " + SizeText(bytes, choice::kSizeFitting);
+  std::string text = TrCount("%1 file", "%1 files", files);
+  if (folders > 0) text.append(", ").append(TrCount("%1 folder", "%1 folders", folders));
+  if (lines_.size() < items_.size()) text = Tr("%1 of %2", text, ThousandsText(items_.size()));
+  if (selection_.SelectedCount() > 0) text.append(", ").append(Tr("%1 selected", ThousandsText(selection_.SelectedCount())));
+  if (files > 0) text.append(", ").append(SizeText(bytes, choice::kSizeFitting));
   return text;
 }
 
 std::string BrowserModel::FocusText() const {
   const size_t focus = selection_.Focus();
   if (focus >= LineCount()) return {};
-  std::string text = Line(focus).name + (Line(focus).folder ? ", folder, " : ", ");
-  text += WithThousands(focus + 1) + " of " + WithThousands(LineCount());
-  return text + (selection_.IsSelected(focus) ? ", selected" : "");
+  std::string text = Line(focus).name;
+  if (Line(focus).folder) text.append(", ").append(Tr("folder"));
+  text.append(", ").append(Tr("%1 of %2", ThousandsText(focus + 1), ThousandsText(LineCount())));
+  if (selection_.IsSelected(focus)) text.append(", ").append(Tr("selected"));
+  return text;
 }
 
 std::string SizeText(uint64_t bytes, int32_t mode) {
   constexpr const char* kUnits[] = {"KB", "MB", "GB", "TB", "PB", "EB"};
-  if (mode == choice::kSizeBytes) return WithThousands(bytes) + (bytes == 1 ? " byte" : " bytes");
-  if (mode == choice::kSizeKilobytes) return WithThousands((bytes + 1023) / 1024) + " KB";
-  if (bytes < 1024) return WithThousands(bytes) + (bytes == 1 ? " byte" : " bytes");
+  if (mode == choice::kSizeKilobytes) return ThousandsText((bytes + 1023) / 1024) + " KB";
+  if (mode == choice::kSizeBytes || bytes < 1024) return TrCount("%1 byte", "%1 bytes", bytes);
   double value = static_cast<double>(bytes) / 1024;
   size_t unit = 0;
   while (value >= 999.5 && unit + 1 < std::size(kUnits)) {
     value /= 1024;
     ++unit;
   }
-  char text[32];
-  std::snprintf(text, sizeof text, value < 99.95 ? "%.1f %s" : "%.0f %s", value, kUnits[unit]);
-  return text;
+  return DecimalText(value, value < 99.95 ? 1 : 0) + " " + kUnits[unit];
 }
 
 std::string DateText(int64_t seconds) {

@@ -50,7 +50,7 @@ class BrowserModel {
   std::string PathOfLine(size_t line) const;
   // The line of that name, kNoLine when it is not shown.
   size_t FindLine(std::string_view name) const;
-  // The next line whose name begins with `typed`, from the focus on: `typed` of one letter typed again goes on to the next.
+  // The next line whose name begins with `typed`, from the focus on: `typed` of one letter typed again continues to the next.
   size_t FindTyped(std::string_view typed, bool next) const;
 
   // The selection of lines. Whoever changes it shows it.
@@ -69,7 +69,7 @@ class BrowserModel {
 
   // "312 files, 4 selected, 18.2 MB"
   std::string CountText() const;
-  // The focused line for the ear: "a.bmp, 1 of 12, selected". Empty without one.
+  // The focused line for screen readers: "a.bmp, 1 of 12, selected". Empty without one.
   std::string FocusText() const;
 
  private:
@@ -89,7 +89,7 @@ class BrowserModel {
   Selection selection_;               // over the lines
 };
 
-// A size for people: "740 bytes", "18.2 MB"; by choice::SizeMode.
+// A size in the user's language: "740 bytes", "18.2 MB"; by choice::SizeMode.
 std::string SizeText(uint64_t bytes, int32_t mode);
 // "2026-11-21 19:05"
 std::string DateText(int64_t seconds);

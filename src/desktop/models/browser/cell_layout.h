@@ -35,9 +35,9 @@ class CellLayout {
   int64_t TotalHeight() const { return Rows() * RowHeight() + gap_; }
   int64_t LargestScroll() const;
 
-  // Where a line's cell lies in the list.
+  // Where a line's cell is in the list.
   Rect Cell(size_t line) const;
-  // The line whose cell lies at a point of the list, kNoLine between cells.
+  // The line whose cell is at a point of the list, kNoLine between cells.
   size_t LineAt(int32_t x, int64_t y) const;
   // Lines from the first up to and without the last that a window scrolled by `scroll` shows, in part at least.
   struct Range {

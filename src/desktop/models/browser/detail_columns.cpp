@@ -8,6 +8,7 @@
 #include "desktop/models/browser/browser_model.h"
 #include "registry/registry.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -16,7 +17,7 @@ namespace {
 constexpr int32_t kNarrowest = 20, kWidest = 4000;
 
 std::string NameText(const FolderItem& item) { return item.name; }
-std::string TypeText(const FolderItem& item) { return item.folder ? std::string("Folder") : DescribeFileType(item.name); }
+std::string TypeText(const FolderItem& item) { return item.folder ? std::string(Tr("Folder")) : DescribeFileType(item.name); }
 std::string SizeColumnText(const FolderItem& item) {
   return item.folder ? std::string() : SizeText(item.size, settings.DetailSizeMode);
 }
@@ -24,7 +25,9 @@ std::string ModifiedText(const FolderItem& item) { return item.modified == 0 ? s
 std::string DimensionsText(const FolderItem& item) {
   return item.width == 0 ? std::string() : std::to_string(item.width) + " x " + std::to_string(item.height);
 }
-std::string DepthText(const FolderItem& item) { return item.bits == 0 ? std::string() : std::to_string(item.bits) + " bits"; }
+std::string DepthText(const FolderItem& item) {
+  return item.bits == 0 ? std::string() : TrCount("%1 bit", "%1 bits", static_cast<uint64_t>(item.bits));
+}
 
 // 20040831223208 as "2004-08-31 22:32".
 std::string TakenText(const FolderItem& item) {
@@ -38,13 +41,13 @@ std::string TakenText(const FolderItem& item) {
 
 // clang-format off
 constexpr DetailFacts kDetails[] = {
-    {"Name",       260, false, true,  choice::kSortName,       NameText},
-    {"Type",       190, false, true,  choice::kSortType,       TypeText},
-    {"Size",       110, true,  true,  choice::kSortSize,       SizeColumnText},
-    {"Date",       140, false, true,  choice::kSortDate,       ModifiedText},
-    {"Dimensions", 110, true,  true,  choice::kSortDimensions, DimensionsText},
-    {"Depth",       70, true,  true,  -1,                      DepthText},
-    {"EXIF date",  140, false, false, choice::kSortExifDate,   TakenText},
+    {TrLater("Name"),       260, false, true,  choice::kSortName,       NameText},
+    {TrLater("Type"),       190, false, true,  choice::kSortType,       TypeText},
+    {TrLater("Size"),       110, true,  true,  choice::kSortSize,       SizeColumnText},
+    {TrLater("Date"),       140, false, true,  choice::kSortDate,       ModifiedText},
+    {TrLater("Dimensions"), 110, true,  true,  choice::kSortDimensions, DimensionsText},
+    {TrLater("Depth"),       70, true,  true,  -1,                      DepthText},
+    {TrLater("EXIF date"),  140, false, false, choice::kSortExifDate,   TakenText},
 };
 // clang-format on
 

@@ -19,7 +19,7 @@ struct DetailFacts {
   int32_t sort;   // choice::SortMode that a click on its head asks for, -1 for none
   std::string (*text)(const FolderItem& item);
 };
-// Every column there is, in the order in which they stand at first.
+// Every column there is, in the order in which they are at first.
 std::span<const DetailFacts> AllDetails();
 
 // A column as the user has arranged it.

@@ -12,16 +12,19 @@
 #include "platform/output_file.h"
 #include "platform/paths.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
 namespace {
 
-constexpr const char* kTaken = "There is a file of that name already.";
-constexpr const char* kGone = "It is not there any more.";
-constexpr int kDeepest = 64;  // folders in folders
+constexpr const char* kTaken = TrLater("A file of that name already exists.");
+constexpr const char* kGone = TrLater("It no longer exists.");
+constexpr const char* kNotWritten = TrLater("The copy could not be written; the disk may be full.");
+constexpr const char* kTooDeep = TrLater("The folders are nested too deeply.");
+constexpr int kDeepest = 64;  // levels of folders
 
-// Empty when it went well, else the reason.
+// The reason of a failure, empty for success.
 using Outcome = std::string;
 
 std::string FolderOf(const std::string& path) { return std::string(platform::SplitPath(path).folder); }
@@ -30,32 +33,32 @@ Outcome CopyFile(const std::string& from, const std::string& to, platform::Exist
   constexpr size_t kPart = 4 * 1024 * 1024;
   platform::FileView view;
   platform::OutputFile output;
-  if (!view.Open(from)) return "It cannot be read.";
-  if (!output.Create(to)) return "The folder cannot be written to.";
+  if (!view.Open(from)) return Tr("It cannot be read.");
+  if (!output.Create(to)) return Tr("The folder cannot be written to.");
   const auto bytes = view.Bytes();
   for (size_t at = 0; at < bytes.size(); at += kPart) {
     if (!output.Write(bytes.subspan(at, std::min(kPart, bytes.size() - at))))
-      return "The copy could not be written; the disk may be full.";
+      return Tr(kNotWritten);
   }
-  if (!view.Intact()) return "It was cut short while it was copied.";
+  if (!view.Intact()) return Tr("It was truncated while it was copied.");
   const platform::CommitResult result = output.Commit(existing);
-  if (result == platform::CommitResult::Taken) return kTaken;
-  if (result != platform::CommitResult::Done) return "The copy could not be written; the disk may be full.";
+  if (result == platform::CommitResult::Taken) return Tr(kTaken);
+  if (result != platform::CommitResult::Done) return Tr(kNotWritten);
   (void)platform::CopyTimes(from, to);
   return {};
 }
 
 Outcome CopyTree(const std::string& from, const std::string& to, int depth) {
   if (!platform::IsFolder(from)) return CopyFile(from, to, platform::Existing::Refuse);
-  if (depth > kDeepest) return "Its folders lie too deep in each other.";
-  if (to.starts_with(platform::JoinFolder(from, ""))) return "A folder cannot be copied into itself.";
-  if (platform::FileExists(to)) return kTaken;
+  if (depth > kDeepest) return Tr(kTooDeep);
+  if (to.starts_with(platform::JoinFolder(from, ""))) return Tr("A folder cannot be copied into itself.");
+  if (platform::FileExists(to)) return Tr(kTaken);
   const auto entries = platform::ListFolder(from);
-  if (!entries) return "The folder cannot be read.";
-  if (!platform::MakeFolders(to)) return "The folder cannot be made.";
+  if (!entries) return Tr("The folder cannot be read.");
+  if (!platform::MakeFolders(to)) return Tr("The folder cannot be created.");
   for (const platform::FolderEntry& entry : *entries) {
     Outcome outcome = entry.link
-                          ? Outcome("It holds a link, which is not copied.")
+                          ? Outcome(Tr("It contains a link, which is not copied."))
                           : CopyTree(platform::JoinFolder(from, entry.name), platform::JoinFolder(to, entry.name), depth + 1);
     if (!outcome.empty()) return outcome;
   }
@@ -64,14 +67,14 @@ Outcome CopyTree(const std::string& from, const std::string& to, int depth) {
 
 Outcome DeleteTree(const std::string& path, int depth) {
   if (!platform::IsFolder(path) || platform::FactsOf(path).link) {
-    return platform::DeleteFile(path) ? Outcome() : Outcome("It could not be deleted.");
+    return platform::DeleteFile(path) ? Outcome() : Outcome(Tr("It could not be deleted."));
   }
-  if (depth > kDeepest) return "Its folders lie too deep in each other.";
+  if (depth > kDeepest) return Tr(kTooDeep);
   for (const platform::FolderEntry& entry : platform::ListFolder(path).value_or(std::vector<platform::FolderEntry>())) {
     Outcome outcome = DeleteTree(platform::JoinFolder(path, entry.name), depth + 1);
     if (!outcome.empty()) return outcome;
   }
-  return platform::DeleteFolder(path) ? Outcome() : Outcome("The folder could not be deleted.");
+  return platform::DeleteFolder(path) ? Outcome() : Outcome(Tr("The folder could not be deleted."));
 }
 
 bool SameVolume(const std::string& a, const std::string& b) {
@@ -85,11 +88,11 @@ Outcome MoveOne(const std::string& from, const std::string& to) {
     const bool same = a.identity == b.identity && a.device == b.device;  // a name that differs in case only
     if (!same) return kTaken;
   }
-  if (to.starts_with(platform::JoinFolder(from, ""))) return "A folder cannot be moved into itself.";
+  if (to.starts_with(platform::JoinFolder(from, ""))) return Tr("A folder cannot be moved into itself.");
   const platform::CommitResult result = platform::RenameFile(from, to, platform::Existing::Refuse);
   if (result == platform::CommitResult::Done) return {};
   if (result == platform::CommitResult::Taken) return kTaken;
-  if (SameVolume(from, to)) return "It could not be renamed.";
+  if (SameVolume(from, to)) return Tr("It could not be renamed.");
   // On another volume a move is a copy and a deletion; what was copied goes again if the rest of it fails.
   Outcome outcome = CopyTree(from, to, 0);
   if (!outcome.empty()) {
@@ -101,20 +104,20 @@ Outcome MoveOne(const std::string& from, const std::string& to) {
 
 Outcome TrashOne(const std::string& path) {
   if (!platform::FileExists(path)) return kGone;
-  return platform::MoveToTrash(path) ? Outcome() : Outcome("There is no trash for it; Shift+Delete deletes for good.");
+  return platform::MoveToTrash(path) ? Outcome() : Outcome(Tr("There is no trash on this volume; Shift+Delete deletes permanently."));
 }
 
 Outcome Restore(const std::string& path) {
   if (platform::FileExists(path)) return kTaken;
-  return platform::RestoreFromTrash(path) ? Outcome() : Outcome("It is not in the trash any more.");
+  return platform::RestoreFromTrash(path) ? Outcome() : Outcome(Tr("It is no longer in the trash."));
 }
 
 // The file becomes what it was before, and what it was until now is kept in its place.
 Outcome Exchange(const FileStep& step) {
   if (!platform::FileExists(step.from)) return kGone;
-  if (step.previous->HasChanged(step.from)) return "It has changed since and stays.";
+  if (step.previous->HasChanged(step.from)) return Tr("It was changed since, so it was left alone.");
   PreviousFile now;
-  if (!now.Keep(step.from)) return "There is no room to keep it as it is now.";
+  if (!now.Keep(step.from)) return Tr("There is not enough disk space to keep the current file.");
   DropThumbnails(step.from);
   Outcome outcome = CopyFile(step.previous->Path(), step.from, platform::Existing::Replace);
   if (!outcome.empty()) return outcome;
@@ -141,7 +144,7 @@ Outcome RemoveCopy(const FileStep& step) {
   if (copy.kind == platform::FileKind::Missing) return kGone;
   const bool changed = copy.kind == platform::FileKind::Regular && original.kind == platform::FileKind::Regular &&
                        (copy.size != original.size || copy.modified != original.modified);
-  if (changed) return "The copy has changed since and stays.";
+  if (changed) return Tr("The copy was changed since, so it was left alone.");
   return TrashOne(step.to);
 }
 
@@ -157,17 +160,6 @@ Outcome UndoStep(DeedKind kind, const FileStep& step) {
   return Restore(step.from);
 }
 
-const char* KindName(DeedKind kind) {
-  switch (kind) {
-    case DeedKind::Rename: return "rename";
-    case DeedKind::Move: return "move";
-    case DeedKind::Copy: return "copy";
-    case DeedKind::Create: return "output";
-    case DeedKind::Turn: return "rotation";
-    case DeedKind::Trash: break;
-  }
-  return "deletion";
-}
 
 }  // namespace
 
@@ -231,9 +223,18 @@ DeedResult DeleteForGood(const std::vector<std::string>& paths, const DeedProgre
 }
 
 std::string DeedName(const FileDeed& deed) {
-  std::string name = std::string(KindName(deed.kind)) + " of ";
-  if (deed.steps.size() == 1) return name.append(platform::FileNameOf(deed.steps[0].from));
-  return name + std::to_string(deed.steps.size()) + " files";
+  const size_t count = deed.steps.size();
+  const std::string_view name = count == 1 ? platform::FileNameOf(deed.steps[0].from) : std::string_view();
+  const auto named = [&](const char* one, std::string many) { return count == 1 ? Tr(one, name) : std::move(many); };
+  switch (deed.kind) {
+    case DeedKind::Rename: return named(TrLater("rename of %1"), TrCount("rename of %1 file", "rename of %1 files", count));
+    case DeedKind::Move: return named(TrLater("move of %1"), TrCount("move of %1 file", "move of %1 files", count));
+    case DeedKind::Copy: return named(TrLater("copy of %1"), TrCount("copy of %1 file", "copy of %1 files", count));
+    case DeedKind::Create: return named(TrLater("output of %1"), TrCount("output of %1 file", "output of %1 files", count));
+    case DeedKind::Turn: return named(TrLater("rotation of %1"), TrCount("rotation of %1 file", "rotation of %1 files", count));
+    case DeedKind::Trash: break;
+  }
+  return named(TrLater("deletion of %1"), TrCount("deletion of %1 file", "deletion of %1 files", count));
 }
 
 void UndoList::Keep(std::vector<FileDeed>& list, FileDeed deed) {

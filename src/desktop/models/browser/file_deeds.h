@@ -50,7 +50,7 @@ struct DeedResult {
 // Told before each step; false ends the deed there.
 using DeedProgress = std::function<bool(size_t index, size_t count)>;
 
-// The steps of a deed on files and folders: into `folder` under their own names, or into the trash. Files that lie there
+// The steps of a deed on files and folders: into `folder` under their own names, or into the trash. Files that are there
 // already are left out of a move, and a copy gets a number, as it does where the name is taken.
 FileDeed PlanDeed(DeedKind kind, const std::vector<std::string>& paths, const std::string& folder = {});
 
@@ -61,7 +61,7 @@ DeedResult CarryOut(const FileDeed& deed, const DeedProgress& progress = {});
 // the trash.
 DeedResult TakeBack(const FileDeed& deed, const DeedProgress& progress = {});
 
-// Deletes files for good, and folders with what is in them.
+// Deletes files permanently, and folders with what is in them.
 DeedResult DeleteForGood(const std::vector<std::string>& paths, const DeedProgress& progress = {});
 
 // "rename of 12 files", "move of beach.jpg"

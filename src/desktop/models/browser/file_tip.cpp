@@ -9,6 +9,7 @@
 #include "platform/paths.h"
 #include "registry/registry.h"
 #include "settings/job_options.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -26,16 +27,17 @@ std::string Beginning(std::string_view text) {
   return std::string(text.substr(0, end)) + "...";
 }
 
-// What only the file's header tells.
+// The lines that need the file's header.
 void AddHeaderLines(const std::string& path, Status known, std::vector<std::string>& lines) {
   PicturePointer picture;
   const Status status = LoadPictureInfo({.fileName = path, .options = ReadOptionsFromSettings()}, picture);
   const Status problem = status != Status::Ok ? status : known;
-  if (problem != Status::Ok) lines.emplace_back(StatusMessage(problem));
+  if (problem != Status::Ok) lines.push_back(Tr(StatusMessage(problem)));
   if (status != Status::Ok) return;
-  std::string facts = std::to_string(picture->width) + " x " + std::to_string(picture->height) + " pixels, " +
-                      std::to_string(picture->bitsPerPixel) + " bits";
-  if (picture->pageCount > 1) facts += ", " + std::to_string(picture->pageCount) + " pages";
+  std::string facts = Tr("%1 x %2 pixels, %3 bits", picture->width, picture->height, picture->bitsPerPixel);
+  if (picture->pageCount > 1) {
+    facts.append(", ").append(TrCount("%1 page", "%1 pages", static_cast<uint64_t>(picture->pageCount)));
+  }
   lines.push_back(std::move(facts));
   std::string comment = Beginning({reinterpret_cast<const char*>(picture->comment.data()), picture->comment.size()});
   if (!comment.empty()) lines.push_back(std::move(comment));

@@ -29,7 +29,7 @@ std::vector<std::string> Completions(const std::string& typed, const std::vector
   std::vector<std::string> paths;
   if (begun.empty() || std::ranges::find(names, begun) != names.end()) return paths;
   for (const std::string& name : names) {
-    // Other bytes cannot stand in a field for text.
+    // Other bytes cannot be in a field for text.
     if (IsUtf8(name) && EqualIgnoringCase(std::string_view(name).substr(0, begun.size()), begun)) paths.push_back(folder + name);
   }
   std::stable_partition(paths.begin(), paths.end(), [&](const std::string& path) { return path.starts_with(typed); });

@@ -18,7 +18,7 @@ struct Crumb {
 // The folders on the way to a folder given by its absolute path, the root first, the folder itself last.
 std::vector<Crumb> CrumbsOf(const std::string& folder);
 
-// How a typed path may go on, with the names of the folders in the folder that it names: whole paths in their order, those of
+// How a typed path may continue, with the names of the folders in the folder that it names: whole paths in their order, those of
 // equal case first. None for a path that is complete: it ends in a separator, or in one of the names.
 std::vector<std::string> Completions(const std::string& typed, const std::vector<std::string>& names);
 

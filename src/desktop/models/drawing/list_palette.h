@@ -20,7 +20,7 @@ Shade Blend(Shade from, Shade to, double part);
 // The shade next to `wanted` that is readable on, or under, `other`: nearer to black or to white, whichever takes less.
 Shade Readable(Shade wanted, Shade other);
 
-// The shades of a canvas that lists files. Every text is readable on what it stands on.
+// The shades of a canvas that lists files. Every text is readable on what it is on.
 struct ListPalette {
   Shade background, text;
   Shade selected, selectedText;  // with the keyboard

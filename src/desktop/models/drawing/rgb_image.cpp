@@ -97,7 +97,7 @@ Status PrepareWithAlpha(PictureRecord& picture) {
 RgbImage WithoutMatte(const RgbImage& image, Color matte) {
   const uint8_t color[3] = {static_cast<uint8_t>(matte), static_cast<uint8_t>(matte >> 8), static_cast<uint8_t>(matte >> 16)};
   int32_t top = 0, left = 0;
-  // The two sides of a margin differ by one pixel at most, since the picture stands in the middle.
+  // The two sides of a margin differ by one pixel at most, since the picture is in the middle.
   while (2 * (top + 1) < image.height && RowIs(image, top, color) && RowIs(image, image.height - 1 - top, color)) ++top;
   while (2 * (left + 1) < image.width && ColumnIs(image, left, color) && ColumnIs(image, image.width - 1 - left, color)) ++left;
   RgbImage cut;

@@ -12,6 +12,7 @@
 #include "registry/registry.h"
 #include "settings/job_options.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -20,7 +21,7 @@ namespace {
 constexpr const char* kExtension = ".png";
 constexpr int kMostLostRaces = 100;  // for a name, against other programs
 
-// The first path that is free; empty when there is none.
+// The first path that is free; empty if there is none.
 std::string FreePath(const std::string& folder) {
   const std::string_view wanted = settings.ClipboardPictureName.view();
   const std::string name(IsPlainName(wanted) && !wanted.empty() ? wanted : defaultSettings.ClipboardPictureName.view());
@@ -68,7 +69,7 @@ DeedResult KeepPastedPicture(const PastedPicture& pasted, const std::string& fol
   if (status == Status::Ok) {
     result.done.steps.push_back({path, path});
   } else {
-    result.failures.push_back({path.empty() ? folder : path, std::string(StatusMessage(status))});
+    result.failures.push_back({path.empty() ? folder : path, Tr(StatusMessage(status))});
   }
   return result;
 }

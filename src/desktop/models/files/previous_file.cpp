@@ -12,6 +12,7 @@
 #include "platform/unchanged_file.h"
 #include "settings/job_options.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -72,7 +73,7 @@ void DeleteOldPreviousFiles() {
 
 DeedResult TurnOneFile(const std::string& path, Orientation turn) {
   if (platform::FactsOf(path).link)
-    return {{DeedKind::Turn, {}}, {{path, "It is a link and stays; turn the file that it leads to."}}};
+    return {{DeedKind::Turn, {}}, {{path, Tr("This is a link; rotate the file it points to.")}}};
   PreviousFiles previous;
   WriteOptions options{.encode = EncodeOptionsFromSettings()};
   bool kept = true;
@@ -80,10 +81,10 @@ DeedResult TurnOneFile(const std::string& path, Orientation turn) {
   const TurnRequest request{.turn = turn, .seenByExif = settings.ExifAdjustOrientation != 0};
   const TurnedFile turned = TurnPictureFile(path, path, request, ReadOptionsFromSettings(), options);
   if (turned.changed) previous.Replaced(path);
-  DeedResult result{previous.Deed(), {}, turned.note};
+  DeedResult result{previous.Deed(), {}, turned.note.shown};
   if (turned.status != Status::Ok) {
-    const std::string hint = kept ? turned.hint : std::string("There is no room to keep the old file for undo.");
-    result.failures.push_back({path, std::string(StatusMessage(turned.status)) + (hint.empty() ? "" : " ") + hint});
+    const std::string hint = kept ? turned.hint : std::string(Tr("There is not enough disk space to keep the old file for undo."));
+    result.failures.push_back({path, Tr(StatusMessage(turned.status)) + (hint.empty() ? "" : " ") + hint});
   }
   return result;
 }

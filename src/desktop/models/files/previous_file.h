@@ -15,7 +15,7 @@ namespace fotomill::desktop {
 // What a file was before a function replaced it, kept in the data folder until nobody can take that back any more.
 class PreviousFile {
  public:
-  // Keeps the file as it is now. False when there is no room for it.
+  // Keeps the file as it is now. False if there is no room for it.
   [[nodiscard]] bool Keep(const std::string& path);
   // The file was replaced; what it is now is remembered.
   void Replaced(const std::string& path) { replaced_ = platform::FactsOf(path); }

@@ -13,6 +13,7 @@
 #include "registry/registry.h"
 #include "settings/job_options.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -20,13 +21,13 @@ namespace {
 
 // clang-format off
 constexpr HistoryColumnFacts kColumns[] = {
-    {"Name",      KeyNumber::FileHistoryListNameSize,     false},
-    {"Type",      KeyNumber::FileHistoryListTypeSize,     false},
-    {"Function",  KeyNumber::FileHistoryListFunctionSize, false},
-    {"Created",   KeyNumber::FileHistoryListCreatedSize,  false},
-    {"Accessed",  KeyNumber::FileHistoryListAccessedSize, false},
-    {"File size", KeyNumber::FileHistoryListFilesizeSize, true},
-    {"Path",      KeyNumber::FileHistoryListPathSize,     false},
+    {TrLater("Name"),      KeyNumber::FileHistoryListNameSize,     false},
+    {TrLater("Type"),      KeyNumber::FileHistoryListTypeSize,     false},
+    {TrLater("Function"),  KeyNumber::FileHistoryListFunctionSize, false},
+    {TrLater("Created"),   KeyNumber::FileHistoryListCreatedSize,  false},
+    {TrLater("Accessed"),  KeyNumber::FileHistoryListAccessedSize, false},
+    {TrLater("File size"), KeyNumber::FileHistoryListFilesizeSize, true},
+    {TrLater("Path"),      KeyNumber::FileHistoryListPathSize,     false},
 };
 // clang-format on
 
@@ -35,7 +36,7 @@ std::string FolderOf(const std::string& path) {
   return std::string(parts.drive) + std::string(parts.folder);
 }
 
-// Negative when `a` stands before `b`. Where the column does not decide, the names do, and then the last use.
+// Negative when `a` is before `b`. Where the column does not decide, the names do, and then the last use.
 int Compare(const HistoryRow& a, const HistoryRow& b, int32_t column) {
   const auto larger = [](auto left, auto right) { return left > right ? -1 : left < right ? 1 : 0; };
   int order = 0;
@@ -88,7 +89,7 @@ std::string FileHistoryList::Cell(size_t row, size_t column) const {
   switch (static_cast<int32_t>(column)) {
     case choice::kColumnName: return std::string(platform::FileNameOf(entry.path));
     case choice::kColumnType: return DescribeFileType(entry.path);
-    case choice::kColumnFunction: return std::string(FileFunctionName(entry.function));
+    case choice::kColumnFunction: return Tr(FileFunctionName(entry.function));
     case choice::kColumnCreated: return HistoryDate(entry.created, settings.FileHistoryDateMode);
     case choice::kColumnAccessed: return HistoryDate(entry.accessed, settings.FileHistoryDateMode);
     case choice::kColumnSize: return WithThousands(entry.size);

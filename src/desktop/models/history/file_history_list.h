@@ -14,7 +14,7 @@ namespace fotomill::desktop {
 struct HistoryColumnFacts {
   const char* title;
   KeyNumber width;
-  bool number;  // stands at the right
+  bool number;  // is at the right
 };
 // All columns, and what the widths of those that are shown add up to.
 std::span<const HistoryColumnFacts> HistoryColumns();

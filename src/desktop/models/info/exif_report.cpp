@@ -4,6 +4,7 @@
 #include "core/shown_text.h"
 #include "metadata/exif/exif_source.h"
 #include "metadata/exif/exif_tags.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -27,7 +28,7 @@ class Gather : public ExifSink {
   }
   void Finish() {
     report_.text = text_.Text();
-    if (!text_.Complete()) report_.problem = "There was no memory for all of the lines.";
+    if (!text_.Complete()) report_.problem = Tr("There was not enough memory for all lines.");
   }
 
  private:
@@ -50,25 +51,25 @@ ExifReport ReadExifReport(const std::string& path, const ExifTextOptions& option
   ExifSource source;
   report.status = source.Open(path.c_str());
   if (report.status != Status::Ok) {
-    report.problem = std::string(StatusMessage(report.status));
+    report.problem = Tr(StatusMessage(report.status));
     return report;
   }
   if (source.Block().empty()) {
-    report.problem = "There is no EXIF in this file.";
+    report.problem = Tr("This file has no EXIF.");
     return report;
   }
   Gather gather(report, options);
   ExifFindings findings;
   if (!WalkExif(source.Block(), &gather, &findings)) {
     report.status = Status::DamagedFile;
-    report.problem = "The EXIF block of this file is damaged: it does not begin as one.";
+    report.problem = Tr("The EXIF block has no valid header.");
     return report;
   }
   gather.Finish();
   ReadThumbnail(ExifThumbnail(source.Block(), findings), report);
   if (!source.Intact()) {
     report.status = Status::FileReadError;
-    report.problem = "The file became shorter while it was read, so some of this may be wrong.";
+    report.problem = Tr("The file was truncated while it was read; some of this may be wrong.");
   }
   return report;
 }

@@ -24,8 +24,8 @@ struct ExifReport {
   std::string problem;  // a sentence for people where there is nothing to show, or not all; empty otherwise
   std::vector<ExifRow> rows;
   std::string text;                     // the same lines as one text, to be copied, saved or printed
-  RgbImage thumbnail;                   // decoded; empty when there is none that can be
-  std::vector<uint8_t> thumbnailBytes;  // as it lies in the block: a JPEG stream
+  RgbImage thumbnail;                   // decoded; empty if there is none that can be
+  std::vector<uint8_t> thumbnailBytes;  // as it is in the block: a JPEG stream
 };
 
 // Reads and walks a file's EXIF block. Takes as long as the disk takes; any thread may call it.

@@ -1,7 +1,7 @@
 #include "desktop/models/info/info_report.h"
 
 #include <algorithm>
-#include <cstdio>
+#include <cmath>
 #include <map>
 #include <unordered_map>
 
@@ -16,56 +16,52 @@
 #include "registry/registry.h"
 #include "settings/job_options.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
 namespace {
 
-constexpr const char* kDetailsTitle = "Details";
+constexpr const char* kDetailsTitle = TrLater("Details");
+constexpr const char* kFileName = TrLater("File name");
 
-template <typename... Arguments>
-std::string Printed(const char* format, Arguments... arguments) {
-  char text[96];
-  std::snprintf(text, sizeof text, format, arguments...);
-  return text;
-}
+// A resolution: whole, or with two digits.
+std::string DpiText(double dpi) { return DecimalText(dpi, std::abs(dpi - std::round(dpi)) < 0.005 ? 0 : 2); }
 
 std::string PixelsText(int32_t width, int32_t height) {
   const double millions = static_cast<double>(width) * height / 1e6;
-  std::string text = Printed("%d x %d pixels", width, height);
-  if (millions >= 0.1) text += Printed(" (%.1f megapixels)", millions);
-  return text;
+  if (millions < 0.1) return Tr("%1 x %2 pixels", width, height);
+  return Tr("%1 x %2 pixels (%3 megapixels)", width, height, DecimalText(millions, 1));
 }
 
-std::string BytesText(uint64_t bytes) { return WithThousands(bytes) + (bytes == 1 ? " byte" : " bytes"); }
+std::string BytesText(uint64_t bytes) { return TrCount("%1 byte", "%1 bytes", bytes); }
 
 // How large the picture is on paper at its own resolution, or at the assumed one when the file has none.
 std::string PrintSize(const PictureRecord& picture, const InfoOptions& options) {
   const bool own = picture.metadata.dpiX > 0 && picture.metadata.dpiY > 0;
   const double assumed = std::max(options.resolution, 1);
   const double x = own ? picture.metadata.dpiX : assumed, y = own ? picture.metadata.dpiY : assumed;
-  const char* const how = own ? "" : " at %g dots per inch";
   std::string text;
   switch (options.units) {
     case choice::kPixels: return {};
     case choice::kCentimetres:
-      text = Printed("%.2f x %.2f centimeters", picture.width / x * 2.54, picture.height / y * 2.54);
+      text = Tr("%1 x %2 centimeters", DecimalText(picture.width / x * 2.54, 2), DecimalText(picture.height / y * 2.54, 2));
       break;
-    default: text = Printed("%.2f x %.2f inches", picture.width / x, picture.height / y);
+    default: text = Tr("%1 x %2 inches", DecimalText(picture.width / x, 2), DecimalText(picture.height / y, 2));
   }
-  return own ? text : text + Printed(how, assumed);
+  return own ? text : Tr("%1 at %2 dots per inch", text, DpiText(assumed));
 }
 
 void AddFileFacts(const std::string& path, const InfoOptions& options, FileInfo& info, InfoSection& general) {
   const platform::FileFacts facts = platform::FactsOf(path);
-  general.lines.push_back({"File name", std::string(platform::FileNameOf(path))});
+  general.lines.push_back({Tr(kFileName), std::string(platform::FileNameOf(path))});
   const platform::PathParts parts = platform::SplitPath(path);
-  general.lines.push_back({"Folder", std::string(parts.drive) + std::string(parts.folder)});
+  general.lines.push_back({Tr("Folder"), std::string(parts.drive) + std::string(parts.folder)});
   if (facts.kind == platform::FileKind::Missing) return;
   info.size = facts.size;
-  general.lines.push_back({"File size", BytesText(facts.size)});
-  general.lines.push_back({"Created", HistoryDate(facts.created, options.dateMode)});
-  general.lines.push_back({"Changed", HistoryDate(facts.modified, options.dateMode)});
+  general.lines.push_back({Tr("File size"), BytesText(facts.size)});
+  general.lines.push_back({Tr("Created"), HistoryDate(facts.created, options.dateMode)});
+  general.lines.push_back({Tr("Changed"), HistoryDate(facts.modified, options.dateMode)});
 }
 
 void AddPictureFacts(const PictureRecord& picture, const InfoOptions& options, FileInfo& info, InfoSection& general) {
@@ -74,23 +70,24 @@ void AddPictureFacts(const PictureRecord& picture, const InfoOptions& options, F
   info.width = picture.width;
   info.height = picture.height;
   info.imageBytes = picture.imageBytes;
-  general.lines.push_back({"Format", info.format});
-  if (!picture.typeName.empty()) general.lines.push_back({"Type", std::string(picture.typeName.view())});
-  general.lines.push_back({"Dimensions", PixelsText(picture.width, picture.height)});
-  std::string depth = Printed(picture.bitsPerPixel == 1 ? "%d bit" : "%d bits", picture.bitsPerPixel);
-  if ((picture.alphaFlags & kHasAlpha) != 0) depth += " and alpha";
-  general.lines.push_back({"Depth", depth});
-  if (picture.pageCount > 1) general.lines.push_back({"Pages", std::to_string(picture.pageCount)});
+  general.lines.push_back({Tr("Format"), info.format});
+  if (!picture.typeName.empty()) general.lines.push_back({Tr("Type"), std::string(picture.typeName.view())});
+  general.lines.push_back({Tr("Dimensions"), PixelsText(picture.width, picture.height)});
+  std::string depth = TrCount("%1 bit", "%1 bits", static_cast<uint64_t>(picture.bitsPerPixel));
+  if ((picture.alphaFlags & kHasAlpha) != 0) depth = Tr("%1 and alpha", depth);
+  general.lines.push_back({Tr("Depth"), depth});
+  if (picture.pageCount > 1) general.lines.push_back({Tr("Pages"), std::to_string(picture.pageCount)});
   if (picture.metadata.dpiX > 0 && picture.metadata.dpiY > 0) {
-    general.lines.push_back({"Resolution", Printed("%g x %g dots per inch", picture.metadata.dpiX, picture.metadata.dpiY)});
+    general.lines.push_back(
+        {Tr("Resolution"), Tr("%1 x %2 dots per inch", DpiText(picture.metadata.dpiX), DpiText(picture.metadata.dpiY))});
   }
-  if (std::string size = PrintSize(picture, options); !size.empty()) general.lines.push_back({"Print size", std::move(size)});
-  general.lines.push_back({"Image data", BytesText(picture.imageBytes)});
+  if (std::string size = PrintSize(picture, options); !size.empty()) general.lines.push_back({Tr("Print size"), std::move(size)});
+  general.lines.push_back({Tr("Image data"), BytesText(picture.imageBytes)});
 }
 
 // The lines that the codec tells. Those of the form "name: value" are divided.
 InfoSection DetailsOf(const PictureRecord& picture) {
-  InfoSection section{kDetailsTitle, {}};
+  InfoSection section{Tr(kDetailsTitle), {}};
   for (size_t i = 0; i < picture.detailLines.Count(); ++i) {
     const std::string_view line = picture.detailLines.Line(i);
     const size_t colon = line.find(": ");
@@ -118,7 +115,7 @@ void AddExif(const std::string& path, const InfoOptions& options, FileInfo& info
 
 std::string ProblemOf(const std::string& path, Status status) {
   const std::string hint = OpenHint(path, status);
-  return std::string(StatusMessage(status)) + (hint.empty() ? "" : " " + hint);
+  return hint.empty() ? Tr(StatusMessage(status)) : Tr(StatusMessage(status)).append(" ").append(hint);
 }
 
 // How a value differs: every different one with the number of files that have it, the most frequent first.
@@ -126,13 +123,12 @@ std::string SpreadOf(const std::map<std::string, size_t>& counts) {
   constexpr size_t kMost = 4;
   std::vector<std::pair<std::string, size_t>> values(counts.begin(), counts.end());
   std::ranges::stable_sort(values, [](const auto& a, const auto& b) { return a.second > b.second; });
-  std::string text = Printed("%zu different: ", values.size());
+  std::string list;
   for (size_t i = 0; i < std::min(values.size(), kMost); ++i) {
-    if (i > 0) text += "; ";
-    text += values[i].first;
-    if (values[i].second > 1) text += Printed(" (%zu files)", values[i].second);
+    if (i > 0) list += "; ";
+    list += values[i].second > 1 ? Tr("%1 (%2 files)", values[i].first, values[i].second) : values[i].first;
   }
-  return values.size() > kMost ? text + "; ..." : text;
+  return Tr("%1 different: %2", values.size(), values.size() > kMost ? list + "; ..." : list);
 }
 
 struct Compared {
@@ -146,9 +142,9 @@ std::vector<Compared> Compare(std::span<const FileInfo> files) {
   std::unordered_map<std::string_view, size_t> places;
   for (const FileInfo& file : files) {
     for (const InfoSection& section : file.sections) {
-      if (section.title == kDetailsTitle) continue;  // they mean something in files of one format only
+      if (section.title == Tr(kDetailsTitle)) continue;  // they mean something in files of one format only
       for (const InfoLine& line : section.lines) {
-        if (line.label.empty() || line.label == "File name") continue;
+        if (line.label.empty() || line.label == Tr(kFileName)) continue;
         const auto [place, added] = places.emplace(line.label, all.size());
         if (added) all.push_back({line.label, {}, 0});
         ++all[place->second].values[line.value];
@@ -171,7 +167,7 @@ InfoOptions InfoOptionsFromSettings() {
 FileInfo ReadFileInfo(const std::string& path, const InfoOptions& options) {
   FileInfo info;
   info.path = path;
-  InfoSection general{"General", {}};
+  InfoSection general{Tr("General"), {}};
   AddFileFacts(path, options, info, general);
   PicturePointer picture;
   info.status = LoadPictureInfo({.fileName = path, .options = ReadOptionsFromSettings()}, picture);
@@ -188,7 +184,8 @@ FileInfo ReadFileInfo(const std::string& path, const InfoOptions& options) {
 }
 
 std::vector<InfoSection> SummaryOf(std::span<const FileInfo> files) {
-  InfoSection totals{"Totals", {}}, same{"The same in all", {}}, different{"Different", {}}, failed{"Could not be read", {}};
+  InfoSection totals{Tr("Totals"), {}}, same{Tr("The same in all"), {}}, different{Tr("Different"), {}},
+      failed{Tr("Could not be read"), {}};
   uint64_t size = 0, imageBytes = 0, pixels = 0, pictures = 0;
   for (const FileInfo& file : files) {
     size += file.size;
@@ -197,18 +194,18 @@ std::vector<InfoSection> SummaryOf(std::span<const FileInfo> files) {
     pictures += file.width > 0;
     if (file.status != Status::Ok) failed.lines.push_back({std::string(platform::FileNameOf(file.path)), file.problem});
   }
-  totals.lines.push_back({"Files", std::to_string(files.size())});
-  totals.lines.push_back({"Pictures", std::to_string(pictures)});
-  totals.lines.push_back({"File size", BytesText(size)});
-  totals.lines.push_back({"Image data", BytesText(imageBytes)});
-  totals.lines.push_back({"Pixels", Printed("%.1f million", static_cast<double>(pixels) / 1e6)});
+  totals.lines.push_back({Tr("Files"), std::to_string(files.size())});
+  totals.lines.push_back({Tr("Pictures"), std::to_string(pictures)});
+  totals.lines.push_back({Tr("File size"), BytesText(size)});
+  totals.lines.push_back({Tr("Image data"), BytesText(imageBytes)});
+  totals.lines.push_back({Tr("Pixels"), Tr("%1 million", DecimalText(static_cast<double>(pixels) / 1e6, 1))});
   for (const Compared& compared : Compare(files)) {
     if (compared.files < 2) continue;
     if (compared.values.size() == 1 && compared.files == files.size()) {
       same.lines.push_back({compared.label, compared.values.begin()->first});
     } else {
       std::string text = compared.values.size() > 1 ? SpreadOf(compared.values) : compared.values.begin()->first;
-      if (compared.files < files.size()) text += Printed(" (in %zu of %zu files)", compared.files, files.size());
+      if (compared.files < files.size()) text = Tr("%1 (in %2 of %3 files)", text, compared.files, files.size());
       different.lines.push_back({compared.label, std::move(text)});
     }
   }

@@ -15,7 +15,7 @@ constexpr Topic kTopics[] = {
     {"RENAME", "Renaming in sequence"},
 };
 
-// The lines between a heading of the third rank and the next heading; empty when there is no such heading.
+// The lines between a heading of the third rank and the next heading; empty if there is no such heading.
 std::string_view EntryOf(std::string_view page, std::string_view title) {
   const std::string heading = "\n### " + std::string(title) + "\n";
   const size_t start = page.find(heading);

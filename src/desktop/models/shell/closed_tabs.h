@@ -13,7 +13,7 @@ class ClosedTabs {
   void Load();
   bool Empty() const { return folders_.empty(); }
   void Add(const std::string& folder);
-  // The folder of the tab closed last, which is forgotten; none when there is none.
+  // The folder of the tab closed last, which is forgotten; none if there is none.
   std::optional<std::string> Pop();
 
  private:

@@ -43,7 +43,7 @@ void Favourites::Load() {
 bool Favourites::Has(const std::string& folder) const { return std::ranges::find(folders_, folder) != folders_.end(); }
 
 bool Favourites::Add(const std::string& folder) {
-  if (ParseHistoryList(folder, 1) != std::vector{folder}) return false;  // it cannot stand on a line
+  if (ParseHistoryList(folder, 1) != std::vector{folder}) return false;  // it cannot be on a line
   const bool written = EditList(folders_, [&](std::vector<std::string>& folders) {
     if (std::ranges::find(folders, folder) == folders.end() && folders.size() < kMostFolders) folders.push_back(folder);
   });

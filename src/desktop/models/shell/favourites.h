@@ -13,7 +13,7 @@ class Favourites {
   void Load();
   const std::vector<std::string>& Folders() const { return folders_; }
   bool Has(const std::string& folder) const;
-  // False when the folder cannot stand on a line, there are too many, or the file cannot be written.
+  // False when the folder cannot be on a line, there are too many, or the file cannot be written.
   [[nodiscard]] bool Add(const std::string& folder);
   [[nodiscard]] bool Remove(const std::string& folder);
   // A folder was renamed: it, and those in it, are found under the new name. True when that concerns one of them.
@@ -23,7 +23,7 @@ class Favourites {
   std::vector<std::string> folders_;
 };
 
-// Whether a folder is `above` or lies in it.
+// Whether a folder is `above` or is in it.
 bool LiesIn(const std::string& folder, const std::string& above);
 // The path under which something in `from` is found after `from` was renamed to `to`.
 std::string RenamedPath(const std::string& path, const std::string& from, const std::string& to);

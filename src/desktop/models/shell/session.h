@@ -37,10 +37,10 @@ struct Session {
 
 // Reads the text of a session; what is missing or makes no sense is as in a new one.
 Session ParseSession(std::string_view text);
-// Tabs whose folder cannot stand on a line are left out.
+// Tabs whose folder cannot be on a line are left out.
 std::string SessionText(const Session& session);
 
-// The session of the last run, without tabs whose folder has gone. Empty when there is none.
+// The session of the last run, without tabs whose folder has gone. Empty if there is none.
 Session LoadSession();
 // False when it could not be written.
 bool SaveSession(const Session& session);

@@ -48,8 +48,8 @@ bool MayHoldThumbnail(int32_t format);
 // Writes the records that were made for databases since the last call; LoadThumbnail does it as well, now and then.
 void KeepThumbnailRecords();
 
-// Deletes a picture's thumbnail file and its records in the global and the folder's database: it is about to become another one,
-// whose time need not be later.
+// Deletes a picture's thumbnail file and its records in the global and the folder's database: the picture is about to be replaced
+// by a file that may be older.
 void DropThumbnails(const std::string& path);
 
 // Makes a picture's thumbnail record and writes its thumbnail file.

@@ -33,10 +33,10 @@ class ThumbnailLoader {
   ThumbnailLoader(const ThumbnailLoader&) = delete;
   ThumbnailLoader& operator=(const ThumbnailLoader&) = delete;
 
-  // What is wanted from here on, most urgent first. What was wanted before and waits is forgotten, what is in work goes on.
+  // Sets the wanted thumbnails, most urgent first. Pending requests are replaced; running ones finish.
   void Want(std::vector<ThumbnailWish> wishes);
   std::vector<Result> TakeResults();
-  // Thumbnails that wait or are in work.
+  // Thumbnails that wait or are in progress.
   size_t Pending() const;
 
  private:
@@ -56,7 +56,7 @@ class ThumbnailLoader {
 // How many thumbnails to load at a time, so that a core is left for the windows.
 unsigned ThumbnailsAtOnce();
 
-// The thumbnails that were loaded, up to a number of bytes; the one that was not asked for the longest goes first.
+// Loaded thumbnails: an LRU cache, bounded in bytes.
 class ThumbnailCache {
  public:
   explicit ThumbnailCache(uint64_t capacity) : capacity_(capacity) {}

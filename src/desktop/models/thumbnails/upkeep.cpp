@@ -8,6 +8,7 @@
 #include "platform/paths.h"
 #include "platform/volumes.h"
 #include "registry/registry.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -16,24 +17,26 @@ namespace {
 using Opened = ThumbnailDatabase::Opened;
 using Compacted = ThumbnailDatabase::Compacted;
 
-constexpr const char* kNoDatabase = "This file is no thumbnail database that can be read. It was left as it is.";
-constexpr int kDeepest = 64;  // folders below folders
+constexpr const char* kNoDatabase = TrLater("Not a readable thumbnail database; left unchanged.");
+constexpr const char* kUnchanged = TrLater("The database was left unchanged.");
+constexpr int kDeepest = 64;  // levels of folders
 
 std::string OutcomeText(Compacted result, int32_t before, int32_t after, uint64_t saved) {
   switch (result) {
     case Compacted::Done:
-      if (before == after)
-        return "There was nothing to drop: all " + WithThousands(static_cast<uint64_t>(after)) + " records stay.";
-      return WithThousands(static_cast<uint64_t>(before - after)) +
-             (before - after == 1 ? " record was dropped, " : " records were dropped, ") +
-             WithThousands(static_cast<uint64_t>(after)) + " stay. The file is " + SizeText(saved, choice::kSizeFitting) +
-             " smaller.";
-    case Compacted::Stopped: return "Stopped. The database stays as it was.";
-    case Compacted::NotRead: return std::string(StatusMessage(Status::FileReadError)) + " The database stays as it was.";
+      if (before == after) {
+        return TrCount("Nothing to remove: the only record is in use.", "Nothing to remove: all %1 records are in use.",
+                       static_cast<uint64_t>(after));
+      }
+      return TrCount("%1 record was removed, %2 remain. The file is %3 smaller.",
+                     "%1 records were removed, %2 remain. The file is %3 smaller.", static_cast<uint64_t>(before - after),
+                     ThousandsText(static_cast<uint64_t>(after)), SizeText(saved, choice::kSizeFitting));
+    case Compacted::Stopped: return std::string(Tr("Stopped.")).append(" ").append(Tr(kUnchanged));
+    case Compacted::NotRead: return Tr(StatusMessage(Status::FileReadError)).append(" ").append(Tr(kUnchanged));
     case Compacted::Failed: break;
   }
-  return std::string(StatusMessage(Status::ErrorWritingFile)) +
-         " The database stays as it was. Is the disk full, or the folder protected?";
+  return Tr(StatusMessage(Status::ErrorWritingFile)).append(" ").append(Tr(kUnchanged)).append(" ").append(
+      Tr("The disk may be full, or the folder write-protected."));
 }
 
 void CollectOrphans(const std::string& folder, int depth, const StopToken& stop, std::vector<std::string>& orphans) {
@@ -55,7 +58,7 @@ void CollectOrphans(const std::string& folder, int depth, const StopToken& stop,
 DatabaseCompaction::DatabaseCompaction(std::string path, bool purge, bool hidden)
     : path_(std::move(path)), hidden_(hidden) {
   const auto ended = [this](Status status) {
-    if (status != Status::Ok) outcome_ = StatusMessage(status);
+    if (status != Status::Ok) outcome_ = Tr(StatusMessage(status));
     ended_ = true;
   };
   task_.Start(
@@ -76,7 +79,7 @@ void DatabaseCompaction::Run(bool purge, const StopToken& stop) {
   ThumbnailDatabase database;
   DatabaseHeader before, after;
   if (database.OpenThumbnailDatabase(path_, false, hidden_) != Opened::Done || !database.ReadDatabaseHeader(before)) {
-    outcome_ = platform::FileExists(path_) ? kNoDatabase : "There is no thumbnail database of that name.";
+    outcome_ = platform::FileExists(path_) ? Tr(kNoDatabase) : Tr("This thumbnail database does not exist.");
   } else {
     const uint64_t size = platform::FactsOf(path_).size;
     const Compacted result = database.CompactThumbnailDatabase(purge, this, stop);
@@ -87,13 +90,13 @@ void DatabaseCompaction::Run(bool purge, const StopToken& stop) {
 }
 
 std::string DescribeDatabase(const std::string& path) {
-  if (path.empty()) return "There is no data folder for it.";
-  if (!platform::FileExists(path)) return "There is none yet.";
+  if (path.empty()) return Tr("There is no data folder.");
+  if (!platform::FileExists(path)) return Tr("It does not exist yet.");
   ThumbnailDatabase database;
   DatabaseHeader header;
-  if (database.OpenThumbnailDatabase(path, false) != Opened::Done || !database.ReadDatabaseHeader(header)) return kNoDatabase;
-  return WithThousands(static_cast<uint64_t>(std::max(header.count, 0))) + (header.count == 1 ? " record, " : " records, ") +
-         SizeText(platform::FactsOf(path).size, choice::kSizeFitting);
+  if (database.OpenThumbnailDatabase(path, false) != Opened::Done || !database.ReadDatabaseHeader(header)) return Tr(kNoDatabase);
+  return TrCount("%1 record, %2", "%1 records, %2", static_cast<uint64_t>(std::max(header.count, 0)),
+                 SizeText(platform::FactsOf(path).size, choice::kSizeFitting));
 }
 
 std::vector<std::string> FindOrphanThumbnails(const std::string& folder, bool below, const StopToken& stop) {

@@ -30,7 +30,7 @@ ViewPicturePointer AnimationPlayer::At(double now) {
   return picture;
 }
 
-// To the next frame, if it is there. One that comes late by more than its own time has its time all the same.
+// Moves to the next frame, if it is decoded. A frame more than its duration late is still shown in full.
 void AnimationPlayer::MoveOn(double now) {
   if (AtTheEnd()) playedOnce_ = true;
   if (IsLast()) {

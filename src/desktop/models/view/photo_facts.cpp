@@ -31,7 +31,7 @@ class Values : public ExifSink {
     const auto found = texts_.find(tag);
     return found == texts_.end() ? std::string() : found->second;
   }
-  // 0 where there is none.
+  // 0 if there is none.
   double Number(uint16_t tag) const {
     const auto found = numbers_.find(tag);
     return found == numbers_.end() ? 0 : found->second;
@@ -59,7 +59,7 @@ std::string Printed(const char* format, double number) {
   return text;
 }
 
-// Makers like to stand in front of their models' names as well.
+// Makers like to be in front of their models' names as well.
 std::string Named(const std::string& make, const std::string& model) {
   const std::string_view firstWord = std::string_view(make).substr(0, make.find(' '));
   return make.empty() || model.starts_with(firstWord) ? model : model.empty() ? make : make + " " + model;

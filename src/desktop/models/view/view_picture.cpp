@@ -14,6 +14,7 @@
 #include "processing/geometry/scale.h"
 #include "registry/registry.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -87,8 +88,8 @@ Status PrepareView(PicturePointer picture, ViewPicture& view) {
 }
 
 std::string SizeAndZoom(const PictureRecord& picture, double scale) {
-  return std::to_string(picture.image.Width()) + " x " + std::to_string(picture.image.Height()) + " pixels, " +
-         SizeText(picture.fileSize, choice::kSizeFitting) + ", " + std::to_string(std::lround(scale * 100)) + "%";
+  return Tr("%1 x %2 pixels, %3, %4%", picture.image.Width(), picture.image.Height(),
+            SizeText(picture.fileSize, choice::kSizeFitting), std::lround(scale * 100));
 }
 
 bool ViewPicture::HasChanged() const {

@@ -15,7 +15,7 @@ struct ViewPlace {
   double centreX = 0.5, centreY = 0.5;  // what is in the middle of the window, in parts of the picture
 };
 
-// Where a picture lies in a view window and how large: pure arithmetic in device pixels. A scale of 1 shows each pixel of
+// Where a picture is in a view window and how large: pure arithmetic in device pixels. A scale of 1 shows each pixel of
 // the picture as one pixel of the screen.
 class ViewTransform {
  public:
@@ -45,7 +45,7 @@ class ViewTransform {
   // Size on the screen, at least a pixel.
   int32_t ShownWidth() const;
   int32_t ShownHeight() const;
-  // Of the picture's top left corner; negative when it lies outside.
+  // Of the picture's top left corner; negative when it is outside.
   int32_t X() const;
   int32_t Y() const;
   bool CanPan() const { return ShownWidth() > windowWidth_ || ShownHeight() > windowHeight_; }

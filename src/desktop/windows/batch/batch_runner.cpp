@@ -22,6 +22,7 @@
 #include "platform/paths.h"
 #include "settings/configuration.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -43,7 +44,7 @@ void BatchRunner::Run(BatchJob job, BatchThread::Work work, std::shared_ptr<Prev
   if (!Running()) {
     StartNext();
   } else {
-    shell_.Report("The batch begins when the one before has ended.");
+    shell_.Report(Tr("The batch starts when the previous one has finished."));
     ReportWaiting();
   }
 }
@@ -130,7 +131,7 @@ void BatchRunner::BatchEnded(Status status, const BatchJob& job) {
   if (previous_ != nullptr) shell_.Files().NoteDone(std::exchange(previous_, nullptr)->Deed());
   if (job.filesChanged) shell_.FilesChanged();
   if (!seen_)
-    NotifyUser(shell_.Window(), failed_ == 0 ? "Batch finished" : "Batch finished with errors", Shown(CountLine(job.progress.Files())));
+    NotifyUser(shell_.Window(), failed_ == 0 ? Label("Batch finished") : Label("Batch finished with errors"), Shown(CountLine(job.progress.Files())));
   if (status == Status::Ok) shell_.Report(CountLine(job.progress.Files()));
   CallAfter([this] { StartNext(); });
 }
@@ -146,8 +147,8 @@ OverwriteAnswer BatchRunner::AskOverwrite(const OverwriteQuestion& question, con
 
 std::optional<std::string> BatchRunner::AskDestinationName(const NameQuestion& question) {
   const wxString problem = question.problem.empty() ? wxString() : Shown(question.problem) + "\n";
-  wxTextEntryDialog dialog(DialogParent(), problem + "Write " + Shown(platform::FileNameOf(question.source)) + " to:",
-                           question.title.empty() ? wxString("Destination name") : Shown(question.title),
+  wxTextEntryDialog dialog(DialogParent(), problem + Label("Write %1 to:", Shown(platform::FileNameOf(question.source))),
+                           question.title.empty() ? Label("Destination name") : Shown(Tr(question.title)),
                            wxString::FromUTF8(question.path));
   LogEvent("prompt", "name " + question.path);
   if (dialog.ShowModal() != wxID_OK) return std::nullopt;
@@ -155,7 +156,7 @@ std::optional<std::string> BatchRunner::AskDestinationName(const NameQuestion& q
 }
 
 std::optional<std::string> BatchRunner::AskPassword(const std::string& path) {
-  wxPasswordEntryDialog dialog(DialogParent(), "Password for " + Shown(platform::FileNameOf(path)) + ":", "Password");
+  wxPasswordEntryDialog dialog(DialogParent(), Label("Password for %1:", Shown(platform::FileNameOf(path))), Label("Password"));
   LogEvent("prompt", "password " + path);
   if (dialog.ShowModal() != wxID_OK) return std::nullopt;
   return Utf8(dialog.GetValue());
@@ -188,7 +189,7 @@ void TurnSelection(Shell& shell, Orientation turn) {
 void ConvertSelection(Shell& shell) {
   const std::vector<std::string> files = shell.Tabs().SelectedFiles();
   if (files.empty()) return;
-  DestinationDialog dialog(&shell.Window(), "Convert", files);
+  DestinationDialog dialog(&shell.Window(), Label("Convert"), files);
   LogEvent("prompt", "destination");
   if (dialog.ShowModal() != wxID_OK) return;
   const DestinationChoice choice = dialog.Choice();

@@ -34,34 +34,34 @@ DestinationDialog::DestinationDialog(wxWindow* parent, const wxString& verb, con
   const auto below = wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxTOP, gap * 3 / 2);
 
   auto* formatRow = new wxBoxSizer(wxHORIZONTAL);
-  formatRow->Add(new wxStaticText(this, wxID_ANY, "&Format:"), wxSizerFlags().CenterVertical().Border(wxRIGHT, gap));
+  formatRow->Add(new wxStaticText(this, wxID_ANY, Label("&Format:")), wxSizerFlags().CenterVertical().Border(wxRIGHT, gap));
   format_ = new wxChoice(this, wxID_ANY);
-  format_->SetName("Format");
+  format_->SetName(Label("Format"));
   for (const DestinationFormat& format : formats_) format_->Append(Shown(format.description));
   formatRow->Add(format_, wxSizerFlags(1));
-  options_ = new wxButton(this, wxID_ANY, "&Options...");
+  options_ = new wxButton(this, wxID_ANY, Label("&Options..."));
   formatRow->Add(options_, wxSizerFlags().Border(wxLEFT, gap));
   sizer->Add(formatRow, below);
 
-  beside_ = new wxRadioButton(this, wxID_ANY, "&Beside each picture", wxDefaultPosition, wxDefaultSize, wxRB_GROUP);
-  into_ = new wxRadioButton(this, wxID_ANY, "&Into the folder");
+  beside_ = new wxRadioButton(this, wxID_ANY, Label("&Beside each picture"), wxDefaultPosition, wxDefaultSize, wxRB_GROUP);
+  into_ = new wxRadioButton(this, wxID_ANY, Label("&Into the folder"));
   sizer->Add(beside_, below);
   auto* folderRow = new wxBoxSizer(wxHORIZONTAL);
   folder_ = new wxComboBox(this, wxID_ANY, "", wxDefaultPosition, FromDIP(wxSize(420, -1)), 0, nullptr, 0, wxDefaultValidator,
-                           "Folder");
+                           Label("Folder"));
   for (const std::string& folder : RecentDestinations()) folder_->Append(wxString::FromUTF8(folder));
   folder_->SetValue(folder_->GetCount() > 0 ? folder_->GetString(0)
                                             : wxString::FromUTF8(std::string(platform::SplitPath(files_.front()).folder)));
   folder_->AutoCompleteDirectories();
-  browse_ = new wxButton(this, wxID_ANY, "B&rowse...");
+  browse_ = new wxButton(this, wxID_ANY, Label("B&rowse..."));
   folderRow->Add(into_, wxSizerFlags().CenterVertical().Border(wxRIGHT, gap));
   folderRow->Add(folder_, wxSizerFlags(1));
   folderRow->Add(browse_, wxSizerFlags().Border(wxLEFT, gap));
   sizer->Add(folderRow, below);
 
-  reduce_ = new wxCheckBox(this, wxID_ANY, "Reduce &colors where the format holds fewer");
-  orient_ = new wxCheckBox(this, wxID_ANY, "Turn pictures &upright by their EXIF");
-  metadata_ = new wxCheckBox(this, wxID_ANY, "&Keep EXIF, XMP and color profiles");
+  reduce_ = new wxCheckBox(this, wxID_ANY, Label("Reduce &colors if the format supports fewer"));
+  orient_ = new wxCheckBox(this, wxID_ANY, Label("Rotate pictures &upright by EXIF orientation"));
+  metadata_ = new wxCheckBox(this, wxID_ANY, Label("&Keep EXIF, XMP and color profiles"));
   reduce_->SetValue(true);
   orient_->SetValue(settings.ExifAdjustOrientation != 0);
   metadata_->SetValue(settings.PreserveEXIF != 0);
@@ -71,8 +71,8 @@ DestinationDialog::DestinationDialog(wxWindow* parent, const wxString& verb, con
   sizer->Add(preview_, below);
 
   auto* buttons = new wxBoxSizer(wxHORIZONTAL);
-  ok_ = new wxButton(this, wxID_OK,
-                     verb + (files_.size() == 1 ? wxString(" &1 file") : wxString::Format(" &%zu files", files_.size())));
+  // Translators: %2 is what the button does, "Convert".
+  ok_ = new wxButton(this, wxID_OK, LabelCount("%2 &%1 file", "%2 &%1 files", files_.size(), verb));
   buttons->AddStretchSpacer();
   buttons->Add(new wxButton(this, wxID_CANCEL), wxSizerFlags().Border(wxRIGHT, gap));
   buttons->Add(ok_);
@@ -115,9 +115,9 @@ void DestinationDialog::UpdateControls() {
   const std::string problem = DestinationProblem(choice);
   ok_->Enable(problem.empty() && (!into_->GetValue() || !choice.folder.empty()));
   const std::string first = FirstDestination(choice, files_.front());
-  wxString text = problem.empty() ? "First: " + Shown(first) : Shown(problem);
+  wxString text = problem.empty() ? Label("First: %1", Shown(first)) : Shown(problem);
   const uint64_t space = platform::FreeSpace(choice.folder.empty() ? files_.front() : choice.folder);
-  if (problem.empty() && space > 0) text += " (" + Shown(SizeText(space, choice::kSizeFitting)) + " free)";
+  if (problem.empty() && space > 0) text = Label("%1 (%2 free)", text, Shown(SizeText(space, choice::kSizeFitting)));
   preview_->SetLabel(text);
   Layout();
 }
@@ -127,7 +127,7 @@ void DestinationDialog::ShowFormatOptions() {
 }
 
 void DestinationDialog::Browse() {
-  wxDirDialog dialog(this, "Destination folder", folder_->GetValue());
+  wxDirDialog dialog(this, Label("Destination folder"), folder_->GetValue());
   if (dialog.ShowModal() == wxID_OK) folder_->SetValue(dialog.GetPath());
   UpdateControls();
 }

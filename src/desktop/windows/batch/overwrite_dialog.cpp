@@ -13,6 +13,7 @@
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/paths.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -23,18 +24,18 @@ constexpr int kPaneSide = 240;
 }  // namespace
 
 OverwriteDialog::OverwriteDialog(wxWindow* parent, const OverwriteQuestion& question, const OverwritePreview& preview)
-    : wxDialog(parent, wxID_ANY, Shown(kOverwriteTitle), wxDefaultPosition, wxDefaultSize,
+    : wxDialog(parent, wxID_ANY, Label(kOverwriteTitle.data()), wxDefaultPosition, wxDefaultSize,
                wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "OverwriteBox") {
   const int gap = FromDIP(8);
   auto* sizer = new wxBoxSizer(wxVERTICAL);
   const auto below = wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxTOP, gap);
-  sizer->Add(new wxStaticText(this, wxID_ANY, wxString::FromUTF8(kOverwriteText.data(), kOverwriteText.size())), below);
+  sizer->Add(new wxStaticText(this, wxID_ANY, Label(kOverwriteText.data())), below);
   sizer->Add(new wxStaticText(this, wxID_ANY, Shown(question.path), wxDefaultPosition, wxDefaultSize, wxST_ELLIPSIZE_MIDDLE),
              below);
   auto* row = new wxBoxSizer(wxHORIZONTAL);
-  row->Add(new wxStaticText(this, wxID_ANY, "&File name:"), wxSizerFlags().CenterVertical().Border(wxRIGHT, gap));
+  row->Add(new wxStaticText(this, wxID_ANY, Label("&File name:")), wxSizerFlags().CenterVertical().Border(wxRIGHT, gap));
   name_ =
-      new wxTextCtrl(this, wxID_ANY, Shown(question.name), wxDefaultPosition, wxDefaultSize, 0, wxDefaultValidator, "File name");
+      new wxTextCtrl(this, wxID_ANY, Shown(question.name), wxDefaultPosition, wxDefaultSize, 0, wxDefaultValidator, Label("File name"));
   row->Add(name_, wxSizerFlags(1));
   row->Add(new wxStaticText(this, wxID_ANY, Shown(platform::SplitPath(question.path).extension)),
            wxSizerFlags().CenterVertical().Border(wxLEFT, gap / 2));
@@ -47,7 +48,7 @@ OverwriteDialog::OverwriteDialog(wxWindow* parent, const OverwriteQuestion& ques
   if (question.checks.previews) sizer->Add(panes_ = MakePreviews(question, preview), wxSizerFlags(1).Expand().Border(wxALL, gap));
 
   const auto check = [&](std::string_view label, bool value) {
-    auto* box = new wxCheckBox(this, wxID_ANY, Shown(label));
+    auto* box = new wxCheckBox(this, wxID_ANY, Shown(Tr(label)));
     box->SetValue(value);
     sizer->Add(box, wxSizerFlags().Border(wxLEFT | wxRIGHT | wxTOP, gap));
     return box;
@@ -57,14 +58,14 @@ OverwriteDialog::OverwriteDialog(wxWindow* parent, const OverwriteQuestion& ques
   recycle_ = check(kRecycleText, question.checks.recycle);
   previews_ = check(kPreviewsText, question.checks.previews);
   notify_ = check(kNotifyText, question.checks.notify);
-  auto* note = new wxStaticText(this, wxID_ANY, Shown(kNotifyNote));
+  auto* note = new wxStaticText(this, wxID_ANY, Label(kNotifyNote.data()));
   note->SetFont(note->GetFont().Smaller());
   sizer->Add(note, wxSizerFlags().Border(wxLEFT | wxRIGHT, gap * 3));
 
   auto* buttons = new wxBoxSizer(wxHORIZONTAL);
   auto* help = new wxButton(this, wxID_HELP);
-  auto* skipAll = new wxButton(this, wxID_ANY, "Skip a&ll");
-  skipAll->SetToolTip("Skips this file and every other one of this batch whose name is taken");
+  auto* skipAll = new wxButton(this, wxID_ANY, Label("Skip a&ll"));
+  skipAll->SetToolTip(Label("Skips this file and all others of this batch whose output exists"));
   auto* ok = new wxButton(this, wxID_OK);
   buttons->Add(help);
   buttons->AddStretchSpacer();
@@ -110,8 +111,8 @@ wxSizer* OverwriteDialog::MakePreviews(const OverwriteQuestion& question, const 
     }
     panes->Add(column, wxSizerFlags(1).Expand().Border(wxALL, FromDIP(4)));
   };
-  pane("There now", preview.existing, preview.existingText);
-  pane("New, from " + Shown(platform::FileNameOf(question.source)), preview.incoming, preview.incomingText);
+  pane(Label("Existing file"), preview.existing, preview.existingText);
+  pane(Label("New, from %1", Shown(platform::FileNameOf(question.source))), preview.incoming, preview.incomingText);
   return panes;
 }
 

@@ -21,6 +21,7 @@
 #include "platform/clock.h"
 #include "platform/paths.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -32,8 +33,8 @@ constexpr int kNewsMs = 40;  // what comes is gathered for so long
 
 wxString TimeLeft(double seconds) {
   const long whole = std::lround(std::ceil(seconds));
-  if (whole < 60) return wxString::Format(", %ld s left", whole);
-  return wxString::Format(", %ld min left", (whole + 59) / 60);
+  if (whole < 60) return ", " + Label("%1 s left", whole);
+  return ", " + Label("%1 min left", (whole + 59) / 60);
 }
 
 }  // namespace
@@ -42,7 +43,7 @@ wxString TimeLeft(double seconds) {
 class ProgressWindow::DrawnList : public wxVListBox {
  public:
   DrawnList(ProgressWindow& box, long style) : box_(box) {
-    Create(box.panel_, kProgressListId, wxDefaultPosition, wxDefaultSize, style | wxBORDER_THEME, "Files");
+    Create(box.panel_, kProgressListId, wxDefaultPosition, wxDefaultSize, style | wxBORDER_THEME, Label("Files"));
     SetItemCount(box.rows_.size());
   }
 
@@ -107,7 +108,7 @@ class ProgressWindow::DrawnList : public wxVListBox {
 class ProgressWindow::PlainList : public wxListBox {
  public:
   PlainList(ProgressWindow& box, long style)
-      : wxListBox(box.panel_, kProgressListId, wxDefaultPosition, wxDefaultSize, 0, nullptr, style, wxDefaultValidator, "Files") {
+      : wxListBox(box.panel_, kProgressListId, wxDefaultPosition, wxDefaultSize, 0, nullptr, style, wxDefaultValidator, Label("Files")) {
     for (const Row& row : box.rows_) Append(Shown(row.line.text));
   }
 };
@@ -125,17 +126,17 @@ ProgressWindow::ProgressWindow(wxWindow* frame, ThumbnailService& thumbnails, Ev
   status_ =
       new wxStaticText(panel_, kProgressStatusId, "", wxDefaultPosition, wxDefaultSize, wxST_NO_AUTORESIZE | wxST_ELLIPSIZE_END);
   bar_ = new wxGauge(panel_, wxID_ANY, 1, wxDefaultPosition, wxDefaultSize, wxGA_HORIZONTAL | wxGA_SMOOTH, wxDefaultValidator,
-                     "Progress of the batch");
-  abort_ = new wxButton(panel_, kProgressAbortId, "&Abort");
-  close_ = new wxButton(panel_, kProgressCloseId, "&Close");
+                     Label("Progress of the batch"));
+  abort_ = new wxButton(panel_, kProgressAbortId, Label("&Abort"));
+  close_ = new wxButton(panel_, kProgressCloseId, Label("&Close"));
   close_->Disable();
-  copy_ = new wxButton(panel_, wxID_ANY, "C&opy list");
-  select_ = new wxButton(panel_, wxID_ANY, "&Select failed");
+  copy_ = new wxButton(panel_, wxID_ANY, Label("C&opy list"));
+  select_ = new wxButton(panel_, wxID_ANY, Label("&Select failed"));
   copy_->Hide();
   select_->Hide();
   abort_->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) {
     abort_->Disable();
-    SetStatus("Stopping after the files in work...");
+    SetStatus(Tr("Stopping after the current files..."));
     events_.abort();
   });
   Bind(wxEVT_TIMER, [this](wxTimerEvent&) { ShowNews(); });
@@ -249,8 +250,8 @@ void ProgressWindow::ShowNews() {
   const double passed = platform::MonotonicSeconds() - started_;
   const bool tells = passed >= kTimeLeftAfter && fileDone_ > 0 && fileDone_ < fileCount_ && abort_->IsEnabled();
   const wxString left = tells ? TimeLeft(passed / fileDone_ * (fileCount_ - fileDone_)) : wxString();
-  const char* const wait = waiting_ == 1 ? " batch waits" : " batches wait";
-  const wxString waiting = waiting_ == 0 || done_ ? wxString() : ", " + std::to_string(waiting_) + wait;
+  const wxString waiting =
+      waiting_ == 0 || done_ ? wxString() : ", " + LabelCount("%1 batch is waiting", "%1 batches are waiting", waiting_);
   status_->SetLabel(Shown(text_) + left + waiting);
 }
 

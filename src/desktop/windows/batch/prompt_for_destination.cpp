@@ -15,7 +15,7 @@
 namespace fotomill::desktop {
 
 bool PromptForDestination(wxWindow& parent, const std::string& question) {
-  wxDialog dialog(&parent, wxID_ANY, "Destination", wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE,
+  wxDialog dialog(&parent, wxID_ANY, Label("Destination"), wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE,
                   "PromptForDestinationBox");
   const int gap = dialog.FromDIP(12);
   auto* sizer = new wxBoxSizer(wxVERTICAL);
@@ -23,12 +23,12 @@ bool PromptForDestination(wxWindow& parent, const std::string& question) {
   row->Add(new wxStaticBitmap(&dialog, wxID_ANY, wxArtProvider::GetBitmapBundle(wxART_QUESTION, wxART_MESSAGE_BOX)));
   row->Add(new wxStaticText(&dialog, wxID_ANY, Shown(question)), wxSizerFlags(1).CenterVertical().Border(wxLEFT, gap));
   sizer->Add(row, wxSizerFlags().Expand().Border(wxALL, gap));
-  auto* again = new wxCheckBox(&dialog, wxID_ANY, "&Ask this before every batch");
+  auto* again = new wxCheckBox(&dialog, wxID_ANY, Label("&Ask this before every batch"));
   again->SetValue(true);
-  again->SetToolTip("It can be switched on again in Setup.");
+  again->SetToolTip(Label("Can be re-enabled in Setup."));
   sizer->Add(again, wxSizerFlags().Border(wxLEFT | wxRIGHT, gap));
   auto* buttons = new wxBoxSizer(wxHORIZONTAL);
-  auto* write = new wxButton(&dialog, wxID_OK, "&Write");
+  auto* write = new wxButton(&dialog, wxID_OK, Label("&Write"));
   buttons->AddStretchSpacer();
   buttons->Add(new wxButton(&dialog, wxID_CANCEL), wxSizerFlags().Border(wxRIGHT, gap));
   buttons->Add(write);

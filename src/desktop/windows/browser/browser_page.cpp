@@ -64,10 +64,10 @@ BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& 
 
 void BrowserPage::BuildFilter() {
   filter_ = new wxSearchCtrl(this, wxID_ANY, "", wxDefaultPosition, FromDIP(wxSize(200, -1)), wxTE_PROCESS_ENTER,
-                             wxDefaultValidator, "Filter");
-  filter_->SetDescriptiveText("Filter");
+                             wxDefaultValidator, Label("Filter"));
+  filter_->SetDescriptiveText(Label("Filter"));
   filter_->ShowCancelButton(true);
-  filter_->SetToolTip("Shows only files whose names contain this, or match its * and ?");
+  filter_->SetToolTip(Label("Shows only files whose names contain this text or match this pattern (*, ?)"));
   filter_->Bind(wxEVT_TEXT, [this](wxCommandEvent&) { ApplyFilter(); });
   filter_->Bind(wxEVT_SEARCHCTRL_CANCEL_BTN, [this](wxCommandEvent&) { filter_->Clear(); });
   filter_->Bind(wxEVT_TEXT_ENTER, [this](wxCommandEvent&) { FocusList(); });
@@ -87,7 +87,7 @@ void BrowserPage::BuildViews() {
   events.resize = [this](int steps) { ChangeSize(steps); };
   events.renamed = [this](size_t line, const std::string& name) { host_.RenameFile(model_.PathOfLine(line), name); };
   canvas_ = new ThumbnailCanvas(views_, model_, thumbnails_, events);
-  views_->AddPage(canvas_, "Thumbnails");
+  views_->AddPage(canvas_, Label("Thumbnails"));
 }
 
 // --- folders ---
@@ -123,7 +123,7 @@ void BrowserPage::ShowFolder(const std::string& folder, const std::string& focus
   host_.BrowserChanged();
 }
 
-// How the folder was last asked to be shown, else as all folders are here; what the folder itself says wins, and goes on.
+// How the folder was last asked to be shown, else as all folders are here; what the folder itself says wins, and continues.
 void BrowserPage::UseViewOf(const std::string& folder) {
   const FolderView kept = host_.Views().Find(folder, base_);
   FolderView view = kept;
@@ -209,7 +209,7 @@ void BrowserPage::ShowView() {
     events.contextMenu = [this](size_t line, const wxPoint& place) { host_.ShowContextMenu(*details_, place, line != kNoLine); };
     events.sort = [this](int32_t sort) { SetSort(sort, model_.Modes().sort == sort && !model_.Descending()); };
     details_ = new DetailsList(views_, model_, host_.Columns(), events);
-    views_->AddPage(details_, "Details");
+    views_->AddPage(details_, Label("Details"));
   }
   const bool hadFocus = canvas_->HasFocus() || (details_ != nullptr && details_->HasFocus());
   views_->SetSelection(details ? kDetailsView : kThumbnailView);
@@ -289,7 +289,7 @@ void BrowserPage::EditFocusedName() {
   const size_t focus = model_.Selected().Focus();
   if (focus == kNoLine) return;
   if (!ShowsDetails()) return canvas_->EditName(focus);
-  wxTextEntryDialog dialog(this, "New name:", "Rename", Shown(model_.Line(focus).name));
+  wxTextEntryDialog dialog(this, Label("New name:"), Label("Rename"), Shown(model_.Line(focus).name));
   if (dialog.ShowModal() == wxID_OK) host_.RenameFile(model_.PathOfLine(focus), Utf8(dialog.GetValue()));
 }
 

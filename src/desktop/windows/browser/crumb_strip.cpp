@@ -30,8 +30,8 @@ CrumbStrip::CrumbStrip(wxWindow* parent, Events events)
     : wxPanel(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTAB_TRAVERSAL | wxBORDER_NONE, "Folders on the way"),
       events_(std::move(events)) {
   more_ = new wxButton(this, wxID_ANY, wxString::FromUTF8("\u2026"), wxDefaultPosition, wxDefaultSize,
-                       wxBU_EXACTFIT | wxBORDER_NONE, wxDefaultValidator, "Folders further up");
-  more_->SetToolTip("Folders further up");
+                       wxBU_EXACTFIT | wxBORDER_NONE, wxDefaultValidator, Label("Parent folders"));
+  more_->SetToolTip(Label("Parent folders"));
   more_->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { OfferHidden(); });
   SetMinSize(wxSize(FromDIP(60), more_->GetBestSize().y));
   Bind(wxEVT_SIZE, [this](wxSizeEvent& event) {
@@ -62,7 +62,7 @@ void CrumbStrip::Build() {
     if (i + 1 == places_.size()) place.button->SetFont(place.button->GetFont().Bold());
     place.button->SetToolTip(Shown(place.crumb.folder));
     place.button->Bind(wxEVT_BUTTON, [this, folder = place.crumb.folder](wxCommandEvent&) { OpenLater(folder); });
-    const wxString tip = "Folders in " + name;
+    const wxString tip = Label("Folders in %1", name);
     place.below = new wxBitmapButton(this, wxID_ANY, Symbol("below", 10), wxDefaultPosition, wxDefaultSize,
                                      wxBU_EXACTFIT | wxBORDER_NONE, wxDefaultValidator, tip);
     place.below->SetToolTip(tip);

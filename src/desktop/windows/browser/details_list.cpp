@@ -25,7 +25,7 @@ class DetailsList::Lines : public wxDataViewVirtualListModel {
 
 DetailsList::DetailsList(wxWindow* parent, BrowserModel& model, DetailColumns& columns, Events events)
     : wxDataViewCtrl(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxDV_MULTIPLE | wxDV_ROW_LINES | wxBORDER_NONE,
-                     wxDefaultValidator, "Details"),
+                     wxDefaultValidator, Label("Details")),
       model_(model),
       columns_(columns),
       events_(std::move(events)),
@@ -55,7 +55,7 @@ void DetailsList::ShowColumns() {
   for (const DetailColumn& column : columns_) {
     const DetailFacts& facts = AllDetails()[column.detail];
     const wxAlignment alignment = facts.number ? wxALIGN_RIGHT : wxALIGN_LEFT;
-    auto* added = new wxDataViewColumn(facts.title, new wxDataViewTextRenderer("string", wxDATAVIEW_CELL_INERT, alignment),
+    auto* added = new wxDataViewColumn(Label(facts.title), new wxDataViewTextRenderer("string", wxDATAVIEW_CELL_INERT, alignment),
                                        static_cast<unsigned>(column.detail), FromDIP(column.width), alignment,
                                        wxDATAVIEW_COL_RESIZABLE | wxDATAVIEW_COL_REORDERABLE);
     added->SetHidden(!column.shown);
@@ -85,7 +85,7 @@ void DetailsList::ChooseColumns() {
   const int first = wxID_HIGHEST + 1;
   KeepColumns();
   for (const DetailColumn& column : columns_) {
-    wxMenuItem* item = menu.AppendCheckItem(first + static_cast<int>(column.detail), AllDetails()[column.detail].title);
+    wxMenuItem* item = menu.AppendCheckItem(first + static_cast<int>(column.detail), Label(AllDetails()[column.detail].title));
     item->Check(column.shown);
     item->Enable(column.detail != 0);
   }

@@ -41,7 +41,7 @@ class DetailsList : public wxDataViewCtrl {
 
   BrowserModel& model_;
   DetailColumns& columns_;
-  DetailColumns shown_;  // as they stand in the list
+  DetailColumns shown_;  // as they are in the list
   const Events events_;
   wxObjectDataPtr<Lines> lines_;
   bool changing_ = false;  // what the list tells now is what it was told

@@ -25,9 +25,9 @@ std::optional<size_t> ChooseFolderFromMenu(wxWindow& window, const std::vector<C
     wxMenuItem* item = menu.Append(kFirstId + static_cast<int>(i), label, "", marked ? wxITEM_CHECK : wxITEM_NORMAL);
     if (marked) item->Check();
   }
-  if (folders.empty()) menu.Append(wxID_NONE, "There are no folders here")->Enable(false);
+  if (folders.empty()) menu.Append(wxID_NONE, Label("No folders"))->Enable(false);
   if (folders.size() > kMostFolders) {
-    menu.Append(wxID_NONE, wxString::Format("and %zu more", folders.size() - kMostFolders))->Enable(false);
+    menu.Append(wxID_NONE, LabelCount("and %1 more", "and %1 more", folders.size() - kMostFolders))->Enable(false);
   }
   LogEvent("folder-menu", std::to_string(folders.size()));
   const int chosen = window.GetPopupMenuSelectionFromUser(menu, 0, window.GetSize().y);

@@ -13,7 +13,7 @@ namespace fotomill::desktop {
 // Items by their place in the list that they were taken from.
 using PlacedItems = std::vector<std::pair<size_t, FolderItem>>;
 
-// Reads a browser's folder apart from the window: what lies in it, and what only the headers of files tell.
+// Reads a browser's folder apart from the window: what is in it, and what only the headers of files tell.
 class FolderReader {
  public:
   // Called on the window's thread, never after the reader has gone.

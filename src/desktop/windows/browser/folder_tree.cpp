@@ -39,7 +39,7 @@ struct FolderTree::Place {
 FolderTree::FolderTree(wxWindow* parent, const Favourites& favourites, Events events)
     : wxTreeCtrl(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize,
                  wxTR_HAS_BUTTONS | wxTR_HIDE_ROOT | wxTR_LINES_AT_ROOT | wxTR_NO_LINES | wxTR_FULL_ROW_HIGHLIGHT | wxBORDER_NONE,
-                 wxDefaultValidator, "Folders"),
+                 wxDefaultValidator, Label("Folders")),
       favourites_(favourites),
       events_(std::move(events)) {
   LoadImages();
@@ -82,12 +82,12 @@ std::vector<FolderTree::Place> FolderTree::Places() const {
   }
   const std::string home = platform::SpecialFolderPath(platform::SpecialFolder::Home);
   const std::string pictures = platform::SpecialFolderPath(platform::SpecialFolder::Pictures);
-  if (!home.empty()) places.push_back({kHomeImage, "Home", home});
-  if (!pictures.empty() && pictures != home) places.push_back({kFolderImage, "Pictures", pictures});
+  if (!home.empty()) places.push_back({kHomeImage, Label("Home"), home});
+  if (!pictures.empty() && pictures != home) places.push_back({kFolderImage, Label("Pictures"), pictures});
   for (const std::string& folder : platform::UserVolumes()) {
     places.push_back({kVolumeImage, Shown(platform::FileNameOf(folder)), folder});
   }
-  places.push_back({kFolderImage, "File system", std::string(1, platform::kSeparator)});
+  places.push_back({kFolderImage, Label("File system"), std::string(1, platform::kSeparator)});
   return places;
 }
 
@@ -244,14 +244,14 @@ void FolderTree::ShowMenu(const wxTreeItemId& item, const wxPoint& point) {
   if (folder.empty()) return;
   const bool named = !platform::FileNameOf(folder).empty();
   wxMenu menu;
-  const int open = menu.Append(wxID_ANY, "&Open")->GetId();
-  const int openInTab = menu.Append(wxID_ANY, "Open in new &tab")->GetId();
+  const int open = menu.Append(wxID_ANY, Label("&Open"))->GetId();
+  const int openInTab = menu.Append(wxID_ANY, Label("Open in new &tab"))->GetId();
   menu.AppendSeparator();
-  const int newFolder = menu.Append(wxID_ANY, "&New folder...")->GetId();
-  wxMenuItem* const rename = menu.Append(wxID_ANY, "&Rename...");
+  const int newFolder = menu.Append(wxID_ANY, Label("&New folder..."))->GetId();
+  wxMenuItem* const rename = menu.Append(wxID_ANY, Label("&Rename..."));
   rename->Enable(named);
   menu.AppendSeparator();
-  const int toggle = menu.Append(wxID_ANY, favourites_.Has(folder) ? "Remove from &favourites" : "Add to &favourites")->GetId();
+  const int toggle = menu.Append(wxID_ANY, favourites_.Has(folder) ? Label("Remove from &favorites") : Label("Add to &favorites"))->GetId();
   LogEvent("tree-menu", folder);
   const int chosen = GetPopupMenuSelectionFromUser(menu, point);
   if (chosen == open) events_.chosen(folder);
@@ -263,7 +263,7 @@ void FolderTree::ShowMenu(const wxTreeItemId& item, const wxPoint& point) {
 
 void FolderTree::AskForName(const std::string& folder) {
   const std::string name(platform::FileNameOf(folder));
-  wxTextEntryDialog dialog(this, "New name:", "Rename", Shown(name));
+  wxTextEntryDialog dialog(this, Label("New name:"), Label("Rename"), Shown(name));
   if (dialog.ShowModal() != wxID_OK) return;
   const std::string typed = Utf8(dialog.GetValue());
   if (!typed.empty() && typed != name) events_.rename(folder, typed);

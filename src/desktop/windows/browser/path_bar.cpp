@@ -36,7 +36,7 @@ PathBar::PathBar(wxWindow* parent, const FolderTrail& trail, Events events)
       events_(std::move(events)) {
   auto* row = new wxBoxSizer(wxHORIZONTAL);
   const int gap = FromDIP(4);
-  const auto button = [&](const char* symbol, const char* tip, auto run) {
+  const auto button = [&](const char* symbol, const wxString& tip, auto run) {
     auto* made = new wxBitmapButton(this, wxID_ANY, Symbol(symbol), wxDefaultPosition, wxDefaultSize, wxBORDER_NONE,
                                     wxDefaultValidator, tip);
     made->SetToolTip(tip);
@@ -48,9 +48,9 @@ PathBar::PathBar(wxWindow* parent, const FolderTrail& trail, Events events)
     row->Add(made, wxSizerFlags().CenterVertical().Border(wxLEFT, gap));
     return made;
   };
-  back_ = button("back", "Back", [this] { events_.step(-1); });
-  forward_ = button("forward", "Forward", [this] { events_.step(1); });
-  button("up", "Parent folder", [this] { events_.up(); });
+  back_ = button("back", Label("Back"), [this] { events_.step(-1); });
+  forward_ = button("forward", Label("Forward"), [this] { events_.step(1); });
+  button("up", Label("Parent folder"), [this] { events_.up(); });
   back_->Bind(wxEVT_CONTEXT_MENU, [this](wxContextMenuEvent&) { OfferSteps(*back_, -1); });
   forward_->Bind(wxEVT_CONTEXT_MENU, [this](wxContextMenuEvent&) { OfferSteps(*forward_, 1); });
   crumbs_ = new CrumbStrip(this, {events_.open, [this] { Edit(); }});
@@ -61,7 +61,7 @@ PathBar::PathBar(wxWindow* parent, const FolderTrail& trail, Events events)
 }
 
 void PathBar::BuildEdit() {
-  edit_ = new wxTextCtrl(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxTE_PROCESS_ENTER, wxDefaultValidator, "Folder");
+  edit_ = new wxTextCtrl(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxTE_PROCESS_ENTER, wxDefaultValidator, Label("Folder"));
   edit_->Bind(wxEVT_TEXT, [this](wxCommandEvent&) { ReadNames(); });
   edit_->Hide();
   edit_->Bind(wxEVT_TEXT_ENTER, [this](wxCommandEvent&) { OpenTyped(); });

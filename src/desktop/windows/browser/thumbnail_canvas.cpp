@@ -35,7 +35,7 @@ bool OpensMenu(const wxKeyEvent& event) {
 ThumbnailCanvas::ThumbnailCanvas(wxWindow* parent, BrowserModel& model, ThumbnailService& thumbnails, Events events)
     : model_(model), thumbnails_(thumbnails), events_(std::move(events)), bandTimer_(this), tip_(*this) {
   SetBackgroundStyle(wxBG_STYLE_PAINT);
-  Create(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxVSCROLL | wxWANTS_CHARS | wxBORDER_NONE, "Thumbnails");
+  Create(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxVSCROLL | wxWANTS_CHARS | wxBORDER_NONE, Label("Thumbnails"));
   SetLabel("Files of the folder");
   Bind(wxEVT_PAINT, &ThumbnailCanvas::OnPaint, this);
   Bind(wxEVT_SIZE, &ThumbnailCanvas::OnSize, this);
@@ -61,7 +61,7 @@ ThumbnailCanvas::ThumbnailCanvas(wxWindow* parent, BrowserModel& model, Thumbnai
   Bind(wxEVT_KILL_FOCUS, [this](wxFocusEvent& event) { Refresh(), event.Skip(); });
   Bind(wxEVT_SYS_COLOUR_CHANGED, [this](wxSysColourChangedEvent& event) { Refresh(), event.Skip(); });
   Bind(wxEVT_DPI_CHANGED, [this](wxDPIChangedEvent& event) { ModelChanged(), event.Skip(); });
-  // While the rubber band is held beyond the edge the list goes on scrolling.
+  // While the rubber band is held beyond the edge the list continues scrolling.
   Bind(wxEVT_TIMER, [this](wxTimerEvent&) {
     const wxPoint mouse = ScreenToClient(wxGetMousePosition());
     const int beyond = mouse.y < 0 ? mouse.y : std::max(mouse.y - GetClientSize().y, 0);
@@ -236,8 +236,8 @@ size_t ThumbnailCanvas::LineAt(const wxPoint& point) const { return layout_.Line
 // Screen readers know the canvas by the file with the focus, and say it again when that changes.
 void ThumbnailCanvas::ReportFocus() {
   const wxString focus = Shown(model_.FocusText());
-  const wxString count = Shown(std::to_string(model_.Selected().SelectedCount()) + " selected");
-  ReportToScreenReader(*this, focus.empty() ? wxString("Thumbnails") : focus, "Thumbnails, " + count);
+  const wxString count = Label("Thumbnails, %1 selected", model_.Selected().SelectedCount());
+  ReportToScreenReader(*this, focus.empty() ? Label("Thumbnails") : focus, count);
 }
 
 void ThumbnailCanvas::ReportSelection() {
@@ -392,7 +392,7 @@ void ThumbnailCanvas::EditName(size_t line) {
   const int top = static_cast<int>(cell.y - scroll_) + cell.height - height;
   editedLine_ = line;
   editor_ = new wxTextCtrl(this, wxID_ANY, Shown(name), wxPoint(cell.x, top), wxSize(std::max(cell.width, FromDIP(160)), height),
-                           wxTE_PROCESS_ENTER, wxDefaultValidator, "New name");
+                           wxTE_PROCESS_ENTER, wxDefaultValidator, Label("New name"));
   editor_->Bind(wxEVT_TEXT_ENTER, [this](wxCommandEvent&) { CallAfter([this] { FinishEdit(true); }); });
   editor_->Bind(wxEVT_KILL_FOCUS, [this](wxFocusEvent& event) {
     CallAfter([this] { FinishEdit(true); });

@@ -85,7 +85,7 @@ class ThumbnailCanvas : public wxWindow {
   CellLayout layout_;
   int64_t scroll_ = 0;
   int direction_ = 1;  // of scrolling: what is ahead is loaded first
-  int square_ = 96;    // the picture's place in a cell, 0 where there is none
+  int square_ = 96;    // the picture's place in a cell, 0 if there is none
   int textHeight_ = 16;
   int painted_ = 0;     // 1: anything, 2: files
   std::string filled_;  // the folder of which every visible cell has shown a picture

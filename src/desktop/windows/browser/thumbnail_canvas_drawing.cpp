@@ -54,7 +54,7 @@ void ThumbnailCanvas::Paint() {
   dc.SetFont(GetFont());
   if (model_.LineCount() == 0 && !model_.Folder().empty()) {
     dc.SetTextForeground(looks.note);
-    dc.DrawLabel(model_.Filter().empty() ? "There are no pictures in this folder." : "No name matches the filter.",
+    dc.DrawLabel(model_.Filter().empty() ? Label("There are no pictures in this folder.") : Label("No name matches the filter."),
                  wxRect(GetClientSize()), wxALIGN_CENTER);
   }
   const CellLayout::Range visible = layout_.Visible(scroll_);

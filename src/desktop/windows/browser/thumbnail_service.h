@@ -20,7 +20,7 @@ class ThumbnailService : public wxEvtHandler {
   ~ThumbnailService() override;
 
   // The thumbnail that serves a wish, and any that is there of a file, whatever its size and age;
-  // null when there is none in the cache.
+  // null if there is none in the cache.
   ThumbnailPointer Find(const ThumbnailWish& wish) { return cache_.Find(wish); }
   ThumbnailPointer FindAny(const std::string& path) const { return cache_.FindAny(path); }
   // Replaces all wishes; only one browser is in front.

@@ -27,14 +27,14 @@ UpdateBar::UpdateBar(wxWindow* parent, std::function<void(int32_t choice)> answe
   choices_->SetName(kThumbnailUpdateRequest);
   choices_->SetToolTip(kThumbnailUpdateRequest);
   for (const ThumbnailUpdateChoice& choice : kThumbnailUpdateChoices) {
-    choices_->Append(wxControl::RemoveMnemonics(wxString::FromUTF8(choice.text)));
+    choices_->Append(wxControl::RemoveMnemonics(Label(choice.text)));
   }
   auto* ok = new wxButton(this, wxID_OK);
   ok_ = ok;
   auto* close =
       new wxButton(this, wxID_CLOSE, wxString::FromUTF8("\xC3\x97"), wxDefaultPosition, FromDIP(wxSize(32, -1)), wxBORDER_NONE);
-  close->SetName("Close");  // the sign would be read as "times"
-  close->SetToolTip("Close");
+  close->SetName(Label("Close"));  // the sign would be read as "times"
+  close->SetToolTip(Label("Close"));
   auto* question = new wxBoxSizer(wxHORIZONTAL);
   question->Add(text_, wxSizerFlags(1).CenterVertical());
   question->Add(close, wxSizerFlags().CenterVertical());

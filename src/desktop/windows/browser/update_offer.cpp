@@ -4,6 +4,7 @@
 
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/browser/update_bar.h"
+#include "desktop/windows/widgets/wx_text.h"
 #include "settings/job_options.h"
 
 namespace fotomill::desktop {
@@ -52,7 +53,7 @@ void UpdateOffer::Offer(const std::string& folder, std::vector<std::string> file
   };
   events.building = [this, post](size_t done, size_t total) {
     post([this, done, total] {
-      bar_->Report(wxString::Format("Creating thumbnails: %zu of %zu", done, total));
+      bar_->Report(Label("Creating thumbnails: %1 of %2", done, total));
       ShowBar(done < total);
     });
   };

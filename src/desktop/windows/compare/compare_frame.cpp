@@ -23,6 +23,7 @@
 #include "platform/paths.h"
 #include "settings/configuration.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -56,24 +57,24 @@ constexpr auto IsOn = SettingIsOn<CompareFrame, setting>;
 
 // clang-format off
 constexpr KeyCommand<CompareFrame> kCommands[] = {
-    {"&Next pane",        "Tab",       {WXK_TAB},                       StepPane<1>},
-    {"&Previous pane",    "Shift+Tab", {},                              StepPane<-1>},
-    {"&Join zoom and place", "J",      {'J'},                           Of<&CompareFrame::ToggleJoined>, AreJoined},
+    {TrLater("&Next pane"),        "Tab",       {WXK_TAB},                       StepPane<1>},
+    {TrLater("&Previous pane"),    "Shift+Tab", {},                              StepPane<-1>},
+    {TrLater("Lin&k zoom and position"), "J",      {'J'},                           Of<&CompareFrame::ToggleJoined>, AreJoined},
     {nullptr, nullptr, {}, nullptr},
-    {"Zoom &in",          "+",         {'+', '=', WXK_NUMPAD_ADD},      OfCanvas<&ViewCanvas::ZoomIn>},
-    {"Zoom &out",         "-",         {'-', WXK_NUMPAD_SUBTRACT},      OfCanvas<&ViewCanvas::ZoomOut>},
-    {"Fit to &window",    "0",         {'0', WXK_NUMPAD0},              Zoom<ZoomMode::Fit>},
-    {"&Actual size",      "1",         {'1', WXK_NUMPAD1},              OfCanvas<&ViewCanvas::ZoomActual>},
-    {"Fit to wi&dth",     "2",         {'2', WXK_NUMPAD2},              Zoom<ZoomMode::FitWidth>},
-    {"Fi&ll the window",  "3",         {'3', WXK_NUMPAD3},              Zoom<ZoomMode::Fill>},
+    {TrLater("Zoom &in"),          "+",         {'+', '=', WXK_NUMPAD_ADD},      OfCanvas<&ViewCanvas::ZoomIn>},
+    {TrLater("Zoom &out"),         "-",         {'-', WXK_NUMPAD_SUBTRACT},      OfCanvas<&ViewCanvas::ZoomOut>},
+    {TrLater("Fit to &window"),    "0",         {'0', WXK_NUMPAD0},              Zoom<ZoomMode::Fit>},
+    {TrLater("&Actual size"),      "1",         {'1', WXK_NUMPAD1},              OfCanvas<&ViewCanvas::ZoomActual>},
+    {TrLater("Fit to wi&dth"),     "2",         {'2', WXK_NUMPAD2},              Zoom<ZoomMode::FitWidth>},
+    {TrLater("Fi&ll the window"),  "3",         {'3', WXK_NUMPAD3},              Zoom<ZoomMode::Fill>},
     {nullptr, nullptr, {}, nullptr},
-    {"Full &screen",      "F11",       {WXK_F11, 'F'},                  Of<&CompareFrame::ToggleFullScreen>},
-    {"Colors of the pro&file", "M",    {'M'},                           Switch<&Settings::ViewModeColorProfiles>, IsOn<&Settings::ViewModeColorProfiles>},
-    {"Check&erboard behind transparency", "B", {'B'},                   Switch<&Settings::ViewModeCheckerboard>, IsOn<&Settings::ViewModeCheckerboard>},
-    {"&Get info...",      "Alt+Enter", {},                              Of<&CompareFrame::ShowInfoWindow>},
+    {TrLater("Full &screen"),      "F11",       {WXK_F11, 'F'},                  Of<&CompareFrame::ToggleFullScreen>},
+    {TrLater("Apply color pro&file"), "M",    {'M'},                           Switch<&Settings::ViewModeColorProfiles>, IsOn<&Settings::ViewModeColorProfiles>},
+    {TrLater("Check&erboard behind transparency"), "B", {'B'},                   Switch<&Settings::ViewModeCheckerboard>, IsOn<&Settings::ViewModeCheckerboard>},
+    {TrLater("&Get info..."),      "Alt+Enter", {},                              Of<&CompareFrame::ShowInfoWindow>},
     {nullptr, nullptr, {}, nullptr},
-    {"Dele&te",           "Del",       {WXK_DELETE},                    Of<&CompareFrame::DeleteFile>},
-    {"&Close",            "Esc",       {WXK_ESCAPE, WXK_RETURN, WXK_NUMPAD_ENTER}, Of<&CompareFrame::Leave>},
+    {TrLater("Dele&te"),           "Del",       {WXK_DELETE},                    Of<&CompareFrame::DeleteFile>},
+    {TrLater("&Close"),            "Esc",       {WXK_ESCAPE, WXK_RETURN, WXK_NUMPAD_ENTER}, Of<&CompareFrame::Leave>},
 };
 // clang-format on
 
@@ -82,7 +83,7 @@ std::span<const KeyCommand<CompareFrame>> Commands() { return kCommands; }
 }  // namespace
 
 CompareFrame::CompareFrame(Shell& shell, const std::vector<std::string>& files)
-    : wxFrame(&shell.Window(), wxID_ANY, "Compare", wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE,
+    : wxFrame(&shell.Window(), wxID_ANY, Label("Compare"), wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE,
               "FotomillProfessionalCompare"),
       shell_(shell) {
   SetSize(shell.Window().GetSize());
@@ -133,7 +134,7 @@ void CompareFrame::ArrangePanes() {
   for (const Pane& pane : panes_) grid->Add(pane.panel, wxSizerFlags(1).Expand());
   SetSizer(grid);
   Layout();
-  SetTitle(wxString::Format(count == 1 ? "Compare - %d picture" : "Compare - %d pictures", count));
+  SetTitle(LabelCount("Compare - %1 picture", "Compare - %1 pictures", static_cast<uint64_t>(count)));
 }
 
 size_t CompareFrame::PaneOf(const ViewCanvas* canvas) const {
@@ -202,8 +203,8 @@ void CompareFrame::Focused(size_t pane) {
     each.caption->SetFont(own ? GetFont().Bold() : GetFont());
     each.panel->Refresh();
   }
-  const std::string place = std::to_string(focus_ + 1) + " of " + std::to_string(panes_.size());
-  SetStatusText(Shown(place + (joined_ ? ", zoomed and moved together" : ", zoomed and moved apart")));
+  SetStatusText(joined_ ? Label("%1 of %2, zoomed and moved together", focus_ + 1, panes_.size())
+                        : Label("%1 of %2, zoomed and moved separately", focus_ + 1, panes_.size()));
   LogEvent("compare-focus", std::to_string(focus_ + 1) + "/" + std::to_string(panes_.size()));
 }
 
@@ -212,8 +213,8 @@ void CompareFrame::ShowFacts(const ViewCanvas* canvas) {
   if (place >= panes_.size()) return;
   const Pane& pane = panes_[place];
   const ViewPicturePointer& shown = canvas->Picture();
-  const std::string facts = shown == nullptr            ? "loading..."
-                            : shown->picture == nullptr ? std::string(StatusMessage(shown->status))
+  const std::string facts = shown == nullptr            ? std::string(Tr("loading..."))
+                            : shown->picture == nullptr ? Tr(StatusMessage(shown->status))
                                                         : SizeAndZoom(*shown->picture, canvas->Zoom());
   const wxString name = Shown(platform::FileNameOf(pane.path));
   pane.caption->SetLabel(name + "   " + Shown(facts));
@@ -282,7 +283,7 @@ void CompareFrame::OnKey(wxKeyEvent& event) {
 
 void CompareSelection(Shell& shell) {
   std::vector<std::string> files = shell.Tabs().SelectedFiles();
-  if (!CompareFrame::CanShow(files.size())) return shell.Report("Two to four files can be compared.");
+  if (!CompareFrame::CanShow(files.size())) return shell.Report(Tr("Select two to four files to compare."));
   (new CompareFrame(shell, files))->Show();
 }
 

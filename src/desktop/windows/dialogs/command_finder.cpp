@@ -19,7 +19,7 @@ namespace fotomill::desktop {
 namespace {
 
 wxString LineOf(const Command& command) {
-  wxString line = wxControl::RemoveMnemonics(command.menu) + ": " + wxControl::RemoveMnemonics(command.text);
+  wxString line = wxControl::RemoveMnemonics(Label(command.menu)) + ": " + wxControl::RemoveMnemonics(Label(command.text));
   if (*command.accelerator != '\0') line += wxString("    ") + command.accelerator;
   return line;
 }
@@ -35,13 +35,13 @@ bool HoldsEveryWord(const wxString& text, const wxString& words) {
 class FinderBox : public wxDialog {
  public:
   explicit FinderBox(wxWindow* parent)
-      : wxDialog(parent, wxID_ANY, "Find command", wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
+      : wxDialog(parent, wxID_ANY, Label("Find command"), wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
                  "FindCommandBox") {
     words_ = new wxTextCtrl(this, wxID_ANY, wxEmptyString, wxDefaultPosition, FromDIP(wxSize(420, -1)), wxTE_PROCESS_ENTER);
-    words_->SetHint("Words of its name");
-    words_->SetName("Words of the command's name");
+    words_->SetHint(Label("Words of the command name"));
+    words_->SetName(Label("Words of the command name"));
     list_ = new wxListBox(this, wxID_ANY, wxDefaultPosition, FromDIP(wxSize(420, 300)));
-    list_->SetName("Commands");
+    list_->SetName(Label("Commands"));
     auto* column = new wxBoxSizer(wxVERTICAL);
     column->Add(words_, wxSizerFlags().Expand().Border(wxLEFT | wxTOP | wxRIGHT, FromDIP(10)));
     column->Add(list_, wxSizerFlags(1).Expand().Border(wxALL, FromDIP(10)));
@@ -66,7 +66,7 @@ class FinderBox : public wxDialog {
     found_.clear();
     wxArrayString lines;
     for (const Command& command : Commands()) {
-      if (command.text == nullptr || !HoldsEveryWord(LineOf(command) + " " + command.help, words_->GetValue())) continue;
+      if (command.text == nullptr || !HoldsEveryWord(LineOf(command) + " " + Label(command.help), words_->GetValue())) continue;
       found_.push_back(&command);
       lines.Add(LineOf(command));
     }

@@ -20,13 +20,13 @@ std::optional<std::string> AskForFolder(wxWindow& parent, const wxString& title,
   auto* sizer = new wxBoxSizer(wxVERTICAL);
   auto* row = new wxBoxSizer(wxHORIZONTAL);
   auto* folder = new wxComboBox(&dialog, wxID_ANY, "", wxDefaultPosition, dialog.FromDIP(wxSize(460, -1)), 0, nullptr,
-                                wxTE_PROCESS_ENTER, wxDefaultValidator, "Folder");
+                                wxTE_PROCESS_ENTER, wxDefaultValidator, Label("Folder"));
   for (const std::string& entry : LoadHistoryList(history)) {
     if (entry != kDefaultEntry) folder->Append(wxString::FromUTF8(entry));
   }
   if (folder->GetCount() > 0) folder->SetSelection(0);
   folder->AutoCompleteDirectories();
-  auto* browse = new wxButton(&dialog, wxID_ANY, "B&rowse...");
+  auto* browse = new wxButton(&dialog, wxID_ANY, Label("B&rowse..."));
   row->Add(folder, wxSizerFlags(1));
   row->Add(browse, wxSizerFlags().Border(wxLEFT, gap));
   sizer->Add(row, wxSizerFlags().Expand().Border(wxALL, gap));

@@ -15,37 +15,38 @@
 #include "registry/registry.h"
 #include "settings/plugin_settings.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
 namespace {
 
-constexpr const char* kTitle = "Plug-ins";
+constexpr const char* kTitle = TrLater("Plug-ins");
 
 }  // namespace
 
 PluginBox::PluginBox(wxWindow* parent)
-    : wxDialog(parent, wxID_ANY, kTitle, wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
+    : wxDialog(parent, wxID_ANY, Label(kTitle), wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
                "PluginBox") {
   const int gap = FromDIP(10);
   list_ = new wxDataViewListCtrl(this, wxID_ANY, wxDefaultPosition, FromDIP(wxSize(820, 220)), wxDV_SINGLE | wxDV_ROW_LINES);
-  list_->SetName(kTitle);
-  list_->AppendToggleColumn("On", wxDATAVIEW_CELL_ACTIVATABLE, FromDIP(50), wxALIGN_CENTER);
+  list_->SetName(Label(kTitle));
+  list_->AppendToggleColumn(Label("On"), wxDATAVIEW_CELL_ACTIVATABLE, FromDIP(50), wxALIGN_CENTER);
   struct Column {
     const char* title;
     int width;
   };
-  for (const Column& column : {Column{"Extension", 90}, {"Plug-in", 140}, {"Formats", 200}, {"Can", 150}, {"Module", 150}}) {
-    list_->AppendTextColumn(column.title, wxDATAVIEW_CELL_INERT, TextWidth(*this, column.width));
+  for (const Column& column : {Column{TrLater("Extension"), 90}, {TrLater("Plug-in"), 140}, {TrLater("Formats"), 200}, {TrLater("Supports"), 150}, {TrLater("Module"), 150}}) {
+    list_->AppendTextColumn(Label(column.title), wxDATAVIEW_CELL_INERT, TextWidth(*this, column.width));
   }
   const std::string folder = platform::JoinFolder(platform::ProgramFolder(), "plugin");
-  auto* place = new wxStaticText(this, wxID_ANY, Shown("Plug-ins lie in the folder " + folder), wxDefaultPosition, wxDefaultSize,
+  auto* place = new wxStaticText(this, wxID_ANY, Label("Plug-in folder: %1", Shown(folder)), wxDefaultPosition, wxDefaultSize,
                                  wxST_ELLIPSIZE_MIDDLE);
-  note_ = new wxStaticText(this, wxID_ANY, "A switch that is turned counts from the next start of the program on.");
+  note_ = new wxStaticText(this, wxID_ANY, Label("Changes take effect at the next start of the program."));
   auto* buttons = new wxBoxSizer(wxHORIZONTAL);
-  buttons->Add(new wxButton(this, wxID_PREFERENCES, "&Configure..."));
+  buttons->Add(new wxButton(this, wxID_PREFERENCES, Label("&Configure...")));
   buttons->AddStretchSpacer();
-  buttons->Add(new wxButton(this, wxID_CANCEL, "Close"));
+  buttons->Add(new wxButton(this, wxID_CANCEL, Label("Close")));
   auto* column = new wxBoxSizer(wxVERTICAL);
   column->Add(list_, wxSizerFlags(1).Expand().Border(wxALL, gap));
   column->Add(place, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT, gap));
@@ -94,12 +95,12 @@ void PluginBox::AddModule(const PluginModule& module) {
   for (int32_t row = 0; row < PluginFormatCount(); ++row) {
     const PluginEntry& entry = PluginRow(row);
     if (platform::FileNameOf(entry.path) != module.name) continue;
-    std::string can = entry.exports.writeImage != nullptr ? "read and write" : "read";
-    if (entry.exports.configure != nullptr) can += ", settings";
+    std::string can = entry.exports.writeImage != nullptr ? Tr("read and write") : Tr("read");
+    if (entry.exports.configure != nullptr) can.append(", ").append(Tr("settings"));
     add(row, entry.extension, entry.textA, entry.textB, can);
     loaded = true;
   }
-  if (!loaded) add(-1, {}, {}, {}, module.on ? "not usable here" : "switched off");
+  if (!loaded) add(-1, {}, {}, {}, module.on ? Tr("not usable here") : Tr("disabled"));
 }
 
 void PluginBox::Turn(int line) {
@@ -112,7 +113,7 @@ void PluginBox::Turn(int line) {
   for (const PluginModule& module : PluginModules()) {
     if (module.name != name || module.on == on) continue;
     const std::string_view problem = SaveMessage(SwitchPluginModule(name, on));
-    if (!problem.empty()) wxMessageBox(Shown(problem), kTitle, wxOK | wxICON_WARNING, this);
+    if (!problem.empty()) wxMessageBox(Shown(problem), Label(kTitle), wxOK | wxICON_WARNING, this);
     LogEvent("plugins", name + (on ? " on" : " off"));
   }
 }
@@ -121,7 +122,7 @@ void PluginBox::Configure() {
   const int line = list_->GetSelectedRow();
   if (line == wxNOT_FOUND) return;
   const int32_t row = lines_[static_cast<size_t>(line)].row;
-  if (row < 0 || !ConfigurePluginRow(row)) wxMessageBox(Shown(kNothingToConfigure), kTitle, wxOK | wxICON_INFORMATION, this);
+  if (row < 0 || !ConfigurePluginRow(row)) wxMessageBox(Label(kNothingToConfigure.data()), Label(kTitle), wxOK | wxICON_INFORMATION, this);
 }
 
 }  // namespace fotomill::desktop

@@ -13,15 +13,16 @@
 #include "desktop/models/shell/event_log.h"
 #include "desktop/models/shell/tab_sets.h"
 #include "desktop/windows/widgets/wx_text.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
 namespace {
 
-constexpr const char* kTitle = "Tab sets";
+constexpr const char* kTitle = TrLater("Tab sets");
 
 bool Confirm(wxWindow& parent, const wxString& question, const wxString& verb) {
-  wxMessageDialog dialog(&parent, question, kTitle, wxOK | wxCANCEL | wxCANCEL_DEFAULT | wxICON_WARNING);
+  wxMessageDialog dialog(&parent, question, Label(kTitle), wxOK | wxCANCEL | wxCANCEL_DEFAULT | wxICON_WARNING);
   dialog.SetOKLabel("&" + verb);
   LogEvent("prompt", "tab-set");
   return dialog.ShowModal() == wxID_OK;
@@ -31,20 +32,20 @@ bool Confirm(wxWindow& parent, const wxString& question, const wxString& verb) {
 class TabSetBox : public wxDialog {
  public:
   explicit TabSetBox(wxWindow& parent)
-      : wxDialog(&parent, wxID_ANY, kTitle, wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
+      : wxDialog(&parent, wxID_ANY, Label(kTitle), wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
                  "TabSetBox") {
     const int gap = FromDIP(10);
     auto* sizer = new wxBoxSizer(wxVERTICAL);
-    sizer->Add(new wxStaticText(this, wxID_ANY, "&Sets of tabs:"), wxSizerFlags().Border(wxLEFT | wxRIGHT | wxTOP, gap));
+    sizer->Add(new wxStaticText(this, wxID_ANY, Label("&Tab sets:")), wxSizerFlags().Border(wxLEFT | wxRIGHT | wxTOP, gap));
     list_ = new wxListBox(this, wxID_ANY, wxDefaultPosition, FromDIP(wxSize(320, 200)), 0, nullptr, wxLB_SINGLE,
-                          wxDefaultValidator, "Tab sets");
+                          wxDefaultValidator, Label("Tab sets"));
     sizer->Add(list_, wxSizerFlags(1).Expand().Border(wxALL, gap));
     auto* row = new wxBoxSizer(wxHORIZONTAL);
-    delete_ = new wxButton(this, wxID_DELETE, "&Delete...");
-    open_ = new wxButton(this, wxID_OK, "&Open");
+    delete_ = new wxButton(this, wxID_DELETE, Label("&Delete..."));
+    open_ = new wxButton(this, wxID_OK, Label("&Open"));
     row->Add(delete_);
     row->AddStretchSpacer();
-    row->Add(new wxButton(this, wxID_CANCEL, "Close"), wxSizerFlags().Border(wxRIGHT, gap));
+    row->Add(new wxButton(this, wxID_CANCEL, Label("Close")), wxSizerFlags().Border(wxRIGHT, gap));
     row->Add(open_);
     sizer->Add(row, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, gap));
     SetSizerAndFit(sizer);
@@ -66,7 +67,7 @@ class TabSetBox : public wxDialog {
   void Refill() {
     names_ = TabSetNames();
     list_->Clear();
-    for (const std::string& name : names_) list_->Append(Shown(name) + (name == CurrentTabSet() ? " (in use)" : ""));
+    for (const std::string& name : names_) list_->Append(name == CurrentTabSet() ? Label("%1 (in use)", Shown(name)) : Shown(name));
     if (!names_.empty()) list_->SetSelection(0);
     UpdateControls();
   }
@@ -77,8 +78,8 @@ class TabSetBox : public wxDialog {
   }
   void DeleteChosen() {
     const std::string chosen = Chosen();
-    if (!Confirm(*this, "Delete the tab set \"" + Shown(chosen) + "\"? The folders stay.", "Delete")) return;
-    if (!DeleteTabSet(chosen)) wxMessageBox("The tab set could not be deleted.", kTitle, wxOK | wxICON_WARNING, this);
+    if (!Confirm(*this, Label("Delete the tab set \"%1\"? The folders are not deleted.", Shown(chosen)), Label("Delete"))) return;
+    if (!DeleteTabSet(chosen)) wxMessageBox(Label("The tab set could not be deleted."), Label(kTitle), wxOK | wxICON_WARNING, this);
     Refill();
   }
 
@@ -91,16 +92,16 @@ class TabSetBox : public wxDialog {
 }  // namespace
 
 std::optional<std::string> AskForTabSetName(wxWindow& parent) {
-  wxTextEntryDialog dialog(&parent, "Name under which the tabs are kept:", "Save tabs", Shown(CurrentTabSet()));
+  wxTextEntryDialog dialog(&parent, Label("Name of the tab set:"), Label("Save tabs"), Shown(CurrentTabSet()));
   LogEvent("prompt", "tab-set-name");
   while (dialog.ShowModal() == wxID_OK) {
     const std::string name = Utf8(dialog.GetValue());
     if (TabSetFile(name).empty()) {
-      wxMessageBox("A tab set cannot have this name.", "Save tabs", wxOK | wxICON_WARNING, &parent);
+      wxMessageBox(Label("This name cannot be used."), Label("Save tabs"), wxOK | wxICON_WARNING, &parent);
       continue;
     }
     const bool other = name != CurrentTabSet() && HasTabSet(name);
-    if (!other || Confirm(parent, "There is a tab set \"" + Shown(name) + "\" already. Replace it?", "Replace")) return name;
+    if (!other || Confirm(parent, Label("The tab set \"%1\" already exists. Replace it?", Shown(name)), Label("Replace"))) return name;
   }
   return std::nullopt;
 }

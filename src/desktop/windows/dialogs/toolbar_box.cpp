@@ -8,12 +8,14 @@
 
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/shell/commands.h"
+#include "desktop/windows/widgets/wx_text.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
 namespace {
 
-constexpr const char* kTitle = "Toolbar";
+constexpr const char* kTitle = TrLater("Toolbar");
 
 std::vector<std::string> KnownButtons() {
   std::vector<std::string> known;
@@ -38,8 +40,8 @@ bool AskForToolbar(wxWindow& parent) {
     label.EndsWith("...", &label);
     labels.push_back(label);
   }
-  wxRearrangeDialog dialog(&parent, "Buttons of the toolbar, in their order:", kTitle, order, labels);
-  dialog.GetList()->SetName("Buttons");
+  wxRearrangeDialog dialog(&parent, Label("Toolbar buttons and their order:"), Label(kTitle), order, labels);
+  dialog.GetList()->SetName(Label("Buttons"));
   dialog.GetList()->SetSelection(0);
   dialog.GetList()->SetFocus();
   // Space turns the mark of the selected line from the start; of itself the list does so only after an arrow key.
@@ -55,7 +57,7 @@ bool AskForToolbar(wxWindow& parent) {
     buttons.push_back({before[static_cast<size_t>(place < 0 ? ~place : place)].name, place >= 0});
   }
   if (SaveToolbar(buttons)) return true;
-  wxMessageBox("The toolbar could not be saved in the data folder.", kTitle, wxOK | wxICON_WARNING, &parent);
+  wxMessageBox(Label("The toolbar could not be saved in the data folder."), Label(kTitle), wxOK | wxICON_WARNING, &parent);
   return false;
 }
 

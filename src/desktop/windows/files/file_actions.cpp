@@ -24,6 +24,7 @@
 #include "platform/paths.h"
 #include "settings/history_list.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -43,35 +44,35 @@ PastedPicture PictureOf(const wxBitmap& bitmap) {
 constexpr const char* kGnomeFiles = "x-special/gnome-copied-files";  // "cut" or "copy", then a URL a line
 constexpr size_t kMostFailuresShown = 10;
 
-std::string Count(size_t files) { return files == 1 ? std::string("1 file") : std::to_string(files) + " files"; }
+std::string Count(size_t files) { return TrCount("%1 file", "%1 files", files); }
 
 }  // namespace
 
 FileActions::FileActions(Shell& shell) : shell_(shell), undo_(static_cast<size_t>(std::clamp(settings.UndoLevels, 1, 1000))) {}
 
 void FileActions::Run(const std::string& what, Work work, Then then) {
-  if (busy_) return shell_.Report("Wait until the files before are done.");
+  if (busy_) return shell_.Report(Tr("Please wait for the previous file operation."));
   busy_ = true;
   const auto result = std::make_shared<DeedResult>();
   const auto run = [this, what, work = std::move(work), result](const StopToken& stop) {
     *result = work([this, &what, &stop](size_t index, size_t count) {
       CallAfter([this, what, index, count] {
-        if (count > 1) shell_.Report(what + ": " + std::to_string(index + 1) + " of " + std::to_string(count));
+        if (count > 1) shell_.Report(Tr("%1: %2 of %3", what, index + 1, count));
       });
       return !stop.Asked();
     });
     return Status::Ok;
   };
   task_.Start(Lane::Blocking, run, [this, what, result, then = std::move(then)](Status status) {
-    if (status != Status::Ok) result->failures.push_back({what, std::string(StatusMessage(status))});
+    if (status != Status::Ok) result->failures.push_back({what, Tr(StatusMessage(status))});
     CallAfter([this, what, result, then] { Finished(what, std::move(*result), then); });
   });
 }
 
 void FileActions::Finished(const std::string& what, DeedResult result, const Then& then) {
   busy_ = false;
-  const std::string failed = result.failures.empty() ? "" : ", " + std::to_string(result.failures.size()) + " failed";
-  shell_.Report(what + failed + (result.note.empty() ? "" : ": " + result.note));
+  const std::string done = result.failures.empty() ? what : Tr("%1, %2 failed", what, result.failures.size());
+  shell_.Report(result.note.empty() ? done : done + ": " + result.note);
   LogEvent("files",
            what + " done=" + std::to_string(result.done.steps.size()) + " failed=" + std::to_string(result.failures.size()));
   const std::vector<DeedFailure> failures = result.failures;
@@ -86,8 +87,8 @@ void FileActions::ReportFailures(const std::vector<DeedFailure>& failures) {
   for (size_t i = 0; i < std::min(failures.size(), kMostFailuresShown); ++i) {
     text += Shown(platform::FileNameOf(failures[i].path)) + ": " + Shown(failures[i].reason) + "\n";
   }
-  if (failures.size() > kMostFailuresShown) text += wxString::Format("and %zu more", failures.size() - kMostFailuresShown);
-  wxMessageBox(text, "Not everything could be done", wxOK | wxICON_WARNING, &shell_.Window());
+  if (failures.size() > kMostFailuresShown) text += LabelCount("and %1 more", "and %1 more", failures.size() - kMostFailuresShown);
+  wxMessageBox(text, Label("Some files failed"), wxOK | wxICON_WARNING, &shell_.Window());
 }
 
 void FileActions::Do(DeedKind kind, const std::vector<std::string>& paths, const std::string& folder) {
@@ -120,7 +121,7 @@ bool FileActions::TrashFromView(wxWindow* view, const std::string& path) {
     return false;
   }
   if (settings.PromptDeleteFromView != 0) {
-    wxMessageDialog dialog(view, "Move " + Shown(platform::FileNameOf(path)) + " to the trash?", "Delete",
+    wxMessageDialog dialog(view, Label("Move %1 to the trash?", Shown(platform::FileNameOf(path))), Label("Delete"),
                            wxOK | wxCANCEL | wxICON_QUESTION);
     dialog.SetOKLabel("&Delete");
     if (dialog.ShowModal() != wxID_OK) return false;
@@ -131,14 +132,14 @@ bool FileActions::TrashFromView(wxWindow* view, const std::string& path) {
 bool FileActions::Delete(const std::vector<std::string>& paths) {
   if (paths.empty()) return false;
   const wxString what = paths.size() == 1 ? "\"" + Shown(platform::FileNameOf(paths.front())) + "\"" : Shown(Count(paths.size()));
-  const wxString why = platform::HasTrash(paths.front()) ? wxString() : wxString("There is no trash for files of this folder.\n");
-  wxMessageDialog dialog(&shell_.Window(), why + "Delete " + what + " for good? This cannot be undone.", "Delete",
+  const wxString why = platform::HasTrash(paths.front()) ? wxString() : Label("There is no trash for files of this folder.") + "\n";
+  wxMessageDialog dialog(&shell_.Window(), why + Label("Delete %1 permanently? This cannot be undone.", what), Label("Delete"),
                          wxOK | wxCANCEL | wxCANCEL_DEFAULT | wxICON_WARNING);
   dialog.SetOKLabel("&Delete");
   LogEvent("prompt", "delete");
   if (dialog.ShowModal() != wxID_OK) return false;
   Run(
-      "Deletion for good", [paths](const DeedProgress& progress) { return DeleteForGood(paths, progress); }, [](DeedResult) {});
+      Tr("Permanent deletion"), [paths](const DeedProgress& progress) { return DeleteForGood(paths, progress); }, [](DeedResult) {});
   return true;
 }
 
@@ -151,7 +152,7 @@ void FileActions::Drop(const std::vector<std::string>& paths, const std::string&
 
 void FileActions::Rename(const std::string& path, const std::string& name) {
   if (!IsPlainName(name)) {
-    wxMessageBox("A name cannot hold \"" + Shown(std::string(1, platform::kSeparator)) + "\".", "Rename", wxOK | wxICON_WARNING,
+    wxMessageBox(Label("A name cannot contain \"%1\".", Shown(std::string(1, platform::kSeparator))), Label("Rename"), wxOK | wxICON_WARNING,
                  &shell_.Window());
     return;
   }
@@ -164,7 +165,7 @@ void FileActions::RenameAll(std::vector<FileStep> steps) {
   const std::string shown(platform::FileNameOf(deed.steps.front().to));
   const bool one = deed.steps.size() == 1;
   Run(
-      "Rename", [deed](const DeedProgress& progress) { return CarryOut(deed, progress); },
+      Tr("Rename"), [deed](const DeedProgress& progress) { return CarryOut(deed, progress); },
       [this, one, shown](DeedResult result) {
         const bool done = !result.done.steps.empty();
         for (const FileStep& step : result.done.steps) {
@@ -178,13 +179,13 @@ void FileActions::RenameAll(std::vector<FileStep> steps) {
 }
 
 void FileActions::NewFolder(const std::string& parent) {
-  wxTextEntryDialog dialog(&shell_.Window(), "Name of the new folder:", "New folder",
+  wxTextEntryDialog dialog(&shell_.Window(), Label("Name of the new folder:"), Label("New folder"),
                            wxString::FromUTF8(settings.NewFolderName.c_str()));
   if (dialog.ShowModal() != wxID_OK) return;
   const std::string name = Utf8(dialog.GetValue());
   const std::string path = platform::JoinFolder(parent, name);
   if (!IsPlainName(name) || name.empty() || platform::FileExists(path) || !platform::MakeFolders(path)) {
-    wxMessageBox("The folder could not be made.", "New folder", wxOK | wxICON_WARNING, &shell_.Window());
+    wxMessageBox(Label("The folder could not be created."), Label("New folder"), wxOK | wxICON_WARNING, &shell_.Window());
     return;
   }
   if (BrowserPage* browser = shell_.Tabs().Front(); browser != nullptr && browser->Model().Folder() == parent)
@@ -195,7 +196,7 @@ void FileActions::NewFolder(const std::string& parent) {
 bool FileActions::SaveTurned(const std::string& path, Orientation turn, Turned then) {
   if (busy_) return false;
   const auto work = [path, turn](const DeedProgress&) { return TurnOneFile(path, turn); };
-  Run("Rotation of " + std::string(platform::FileNameOf(path)), work, [this, then = std::move(then)](DeedResult result) {
+  Run(Tr("rotation of %1", platform::FileNameOf(path)), work, [this, then = std::move(then)](DeedResult result) {
     const bool done = !result.done.steps.empty();
     const std::string note = result.note;
     undo_.Add(std::move(result.done));
@@ -210,7 +211,7 @@ void FileActions::Undo() {
   if (!undo_.CanUndo() || busy_) return;
   const FileDeed deed = undo_.TakeUndo();
   Run(
-      "Undo " + DeedName(deed), [deed](const DeedProgress& progress) { return TakeBack(deed, progress); },
+      Tr("Undo %1", DeedName(deed)), [deed](const DeedProgress& progress) { return TakeBack(deed, progress); },
       [this](DeedResult result) {
         Follow(result.done, true);
         undo_.Undone(std::move(result.done));
@@ -221,7 +222,7 @@ void FileActions::Redo() {
   if (!undo_.CanRedo() || busy_) return;
   const FileDeed deed = undo_.TakeRedo();
   Run(
-      "Redo " + DeedName(deed), [deed](const DeedProgress& progress) { return CarryOut(deed, progress); },
+      Tr("Redo %1", DeedName(deed)), [deed](const DeedProgress& progress) { return CarryOut(deed, progress); },
       [this](DeedResult result) {
         Follow(result.done, false);
         undo_.Redone(std::move(result.done));
@@ -246,7 +247,7 @@ void FileActions::ToClipboard(const std::vector<std::string>& paths, bool cut) {
   both->Add(marked);
   const wxClipboardLocker clipboard;
   if (!clipboard || !wxTheClipboard->SetData(both)) return wxBell();
-  shell_.Report(Count(paths.size()) + (cut ? " cut" : " copied") + ".");
+  shell_.Report(cut ? TrCount("%1 file cut.", "%1 files cut.", paths.size()) : TrCount("%1 file copied.", "%1 files copied.", paths.size()));
 }
 
 void FileActions::PathsToClipboard(const std::vector<std::string>& paths) {
@@ -278,10 +279,10 @@ void FileActions::Paste(const std::string& folder) {
 void FileActions::PastePicture(const std::string& folder) {
   wxBitmapDataObject bitmap;
   if (!wxTheClipboard->GetData(bitmap) || !bitmap.GetBitmap().IsOk()) {
-    return shell_.Report("There are no files and no picture on the clipboard.");
+    return shell_.Report(Tr("The clipboard has no files and no picture."));
   }
   Run(
-      "Paste",
+      Tr("Paste"),
       [picture = PictureOf(bitmap.GetBitmap()), folder](const DeedProgress&) { return KeepPastedPicture(picture, folder); },
       [this](DeedResult result) {
         const std::vector<FileStep> made = result.done.steps;
@@ -299,17 +300,23 @@ void DeleteSelection(Shell& shell) { shell.Files().Delete(shell.Tabs().SelectedP
 
 namespace {
 
-void AskAndDo(Shell& shell, const wxString& verb,
+void AskAndDo(Shell& shell, const wxString& verb, const wxString& question,
               void (FileActions::*action)(const std::vector<std::string>&, const std::string&)) {
   const std::vector<std::string> paths = shell.Tabs().SelectedPaths();
   if (paths.empty()) return;
-  const auto folder = AskForFolder(shell.Window(), verb + " " + Shown(Count(paths.size())) + " to", verb, HistoryList::MoveCopy);
+  const auto folder = AskForFolder(shell.Window(), question, verb, HistoryList::MoveCopy);
   if (folder) (shell.Files().*action)(paths, *folder);
 }
 
 }  // namespace
 
-void CopySelectionTo(Shell& shell) { AskAndDo(shell, "Copy", &FileActions::CopyTo); }
-void MoveSelectionTo(Shell& shell) { AskAndDo(shell, "Move", &FileActions::MoveTo); }
+void CopySelectionTo(Shell& shell) {
+  const size_t count = shell.Tabs().SelectedPaths().size();
+  AskAndDo(shell, Label("Copy"), LabelCount("Copy %1 file to", "Copy %1 files to", count), &FileActions::CopyTo);
+}
+void MoveSelectionTo(Shell& shell) {
+  const size_t count = shell.Tabs().SelectedPaths().size();
+  AskAndDo(shell, Label("Move"), LabelCount("Move %1 file to", "Move %1 files to", count), &FileActions::MoveTo);
+}
 
 }  // namespace fotomill::desktop

@@ -24,7 +24,7 @@ class FileActions : public wxEvtHandler {
   // False when the user was asked and does not want it, where there is no trash.
   bool Trash(const std::vector<std::string>& paths);
   // The same of a file that `view` shows; asks first if PromptDeleteFromView wants it. False when the answer was no, or
-  // other files are in work.
+  // other files are in progress.
   bool TrashFromView(wxWindow* view, const std::string& path);
   // Asks first. False when the answer was no.
   bool Delete(const std::vector<std::string>& paths);

@@ -24,9 +24,9 @@ DropKind KindNow() {
 
 // nullopt-like: 1 move, 0 copy, -1 neither.
 int AskKind(const std::string& folder) {
-  wxMessageDialog dialog(nullptr, "Move or copy the files to " + Shown(folder) + "?", "Drop",
+  wxMessageDialog dialog(nullptr, Label("Move or copy the files to %1?", Shown(folder)), Label("Drop files"),
                          wxYES_NO | wxCANCEL | wxICON_QUESTION);
-  dialog.SetYesNoLabels("&Move", "&Copy");
+  dialog.SetYesNoLabels(Label("&Move"), Label("&Copy"));
   const int answer = dialog.ShowModal();
   return answer == wxID_YES ? 1 : answer == wxID_NO ? 0 : -1;
 }
@@ -43,7 +43,7 @@ bool FolderDrop::OnDropFiles(wxCoord x, wxCoord y, const wxArrayString& names) {
   if (folder.empty() || names.empty()) return false;
   std::vector<std::string> files;
   for (const wxString& name : names) files.push_back(Utf8(name));
-  // What lies there already stays.
+  // What is there already stays.
   if (platform::SplitPath(files.front()).folder == platform::JoinFolder(folder, "")) return false;
   const DropKind kind = KindNow();
   // The drag is over before anything is asked or done.

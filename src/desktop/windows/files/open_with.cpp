@@ -7,6 +7,7 @@
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/programs.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -15,7 +16,7 @@ namespace {
 void Open(Shell& shell, const platform::Program& program, const std::vector<std::string>& files) {
   const bool started = platform::OpenWith(program, files);
   LogEvent("open-with", program.name + (started ? "" : " failed"));
-  shell.Report(started ? program.name + " was started." : program.name + " could not be started.");
+  shell.Report(started ? Tr("%1 was started.", program.name) : Tr("%1 could not be started.", program.name));
 }
 
 }  // namespace

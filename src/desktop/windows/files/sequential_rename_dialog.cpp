@@ -29,6 +29,7 @@
 #include "settings/configuration.h"
 #include "settings/history_list.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -56,11 +57,11 @@ struct FlagBox {
 };
 enum Flag : size_t { kSkipColliding, kUpdate, kPrefix, kRandom, kHyphen };  // their places in the table
 constexpr FlagBox kFlags[] = {
-    {KeyNumber::SequentialRenameSkipCollide, "&Skip colliding files"},
-    {KeyNumber::SequentialRenameUpdate, "&Update base number"},
-    {KeyNumber::SequentialRenamePrefix, "&Prefix"},
-    {KeyNumber::SequentialRenameRandom, "&Random"},
-    {KeyNumber::SequentialRenameHyphen, "&Hyphen"},
+    {KeyNumber::SequentialRenameSkipCollide, TrLater("&Skip colliding files")},
+    {KeyNumber::SequentialRenameUpdate, TrLater("&Update base number")},
+    {KeyNumber::SequentialRenamePrefix, TrLater("&Prefix")},
+    {KeyNumber::SequentialRenameRandom, TrLater("&Random")},
+    {KeyNumber::SequentialRenameHyphen, TrLater("&Hyphen")},
 };
 
 std::vector<BatchFile> BatchFiles(const std::vector<std::string>& files, size_t most) {
@@ -91,48 +92,48 @@ class SequentialRenameDialog : public wxDialog {
 };
 
 SequentialRenameDialog::SequentialRenameDialog(wxWindow* parent, const std::vector<std::string>& files)
-    : wxDialog(parent, wxID_ANY, "Sequential Rename", wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
+    : wxDialog(parent, wxID_ANY, Label("Sequential Rename"), wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
                "SequentialRenameBox"),
       files_(files) {
   const int gap = FromDIP(8);
   auto* grid = new wxFlexGridSizer(2, gap, gap);
   grid->AddGrowableCol(1);
-  const auto label = [&](const char* text) {
+  const auto label = [&](const wxString& text) {
     grid->Add(new wxStaticText(this, wxID_ANY, text), wxSizerFlags().CenterVertical());
   };
-  label("&Base name:");
+  label(Label("&Base name:"));
   base_ = new wxComboBox(this, wxID_ANY, wxString::FromUTF8(settings.SequentialRenameBaseName.c_str()), wxDefaultPosition,
-                         FromDIP(wxSize(300, -1)), 0, nullptr, 0, wxDefaultValidator, "Base name");
+                         FromDIP(wxSize(300, -1)), 0, nullptr, 0, wxDefaultValidator, Label("Base name"));
   for (const std::string& entry : LoadHistoryList(HistoryList::RenameBases)) {
     if (entry != kDefaultEntry) base_->Append(wxString::FromUTF8(entry));
   }
   grid->Add(base_, wxSizerFlags(1).Expand());
-  const auto spin = [&](const char* name, int least, int most, int value) {
+  const auto spin = [&](const wxString& name, int least, int most, int value) {
     auto* control =
         new wxSpinCtrl(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxSP_ARROW_KEYS, least, most, value, name);
     grid->Add(control);
     control->Bind(wxEVT_SPINCTRL, [this](wxSpinEvent&) { UpdateControls(); });
     return control;
   };
-  label("Base &number:");
-  number_ = spin("Base number", 0, kMostNumber, settings.SequentialRenameBaseNumber);
-  label("&Increment:");
-  increment_ = spin("Increment", 1, kMostIncrement, settings.SequentialRenameIncrement);
+  label(Label("Base &number:"));
+  number_ = spin(Label("Base number"), 0, kMostNumber, settings.SequentialRenameBaseNumber);
+  label(Label("&Increment:"));
+  increment_ = spin(Label("Increment"), 1, kMostIncrement, settings.SequentialRenameIncrement);
 
   auto* sizer = new wxBoxSizer(wxVERTICAL);
   sizer->Add(grid, wxSizerFlags().Expand().Border(wxALL, gap));
   auto* flags = new wxWrapSizer(wxHORIZONTAL);
   for (size_t i = 0; i < std::size(kFlags); ++i) {
-    flags_[i] = new wxCheckBox(this, wxID_ANY, kFlags[i].text);
+    flags_[i] = new wxCheckBox(this, wxID_ANY, Label(kFlags[i].text));
     flags_[i]->SetValue(NumberIn(KeyOf(kFlags[i].key)) != 0);
     flags_[i]->Bind(wxEVT_CHECKBOX, [this](wxCommandEvent&) { UpdateControls(); });
     flags->Add(flags_[i], wxSizerFlags().Border(wxRIGHT | wxBOTTOM, gap));
   }
   sizer->Add(flags, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT, gap));
   preview_ = new wxListCtrl(this, wxID_ANY, wxDefaultPosition, wxSize(TextWidth(*this, 520), FromDIP(220)),
-                            wxLC_REPORT | wxLC_SINGLE_SEL, wxDefaultValidator, "New names");
-  preview_->AppendColumn("Old name", wxLIST_FORMAT_LEFT, TextWidth(*this, 250));
-  preview_->AppendColumn("New name", wxLIST_FORMAT_LEFT, TextWidth(*this, 250));
+                            wxLC_REPORT | wxLC_SINGLE_SEL, wxDefaultValidator, Label("New names"));
+  preview_->AppendColumn(Label("Old name"), wxLIST_FORMAT_LEFT, TextWidth(*this, 250));
+  preview_->AppendColumn(Label("New name"), wxLIST_FORMAT_LEFT, TextWidth(*this, 250));
   sizer->Add(preview_, wxSizerFlags(1).Expand().Border(wxLEFT | wxRIGHT, gap));
   problem_ = new wxStaticText(this, wxID_ANY, "");
   sizer->Add(problem_, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxTOP, gap));
@@ -140,7 +141,7 @@ SequentialRenameDialog::SequentialRenameDialog(wxWindow* parent, const std::vect
   auto* help = new wxButton(this, wxID_HELP);
   help->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { ShowHelp(*this, "RENAME"); });
   ok_ = new wxButton(this, wxID_OK,
-                     files_.size() == 1 ? wxString("Rename &1 file") : wxString::Format("Rename &%zu files", files_.size()));
+                     LabelCount("&Rename %1 file", "&Rename %1 files", files_.size()));
   buttons->Add(help);
   buttons->AddStretchSpacer();
   buttons->Add(new wxButton(this, wxID_CANCEL), wxSizerFlags().Border(wxRIGHT, gap));
@@ -184,7 +185,7 @@ void SequentialRenameDialog::UpdateControls() {
   base_->Enable(!flags_[kPrefix]->GetValue());  // with the number in front every file keeps its own name behind it
   const bool plain = IsPlainName(base) && !base.empty();
   ok_->Enable(plain || flags_[kPrefix]->GetValue());
-  if (!plain) return problem_->SetLabel("The base name is a part of a file name.");
+  if (!plain) return problem_->SetLabel(Label("The base name must be part of a file name, not a path."));
   PreviewBox box;
   BatchJob job;
   job.box = &box;
@@ -197,11 +198,11 @@ void SequentialRenameDialog::UpdateControls() {
     const long row = preview_->InsertItem(preview_->GetItemCount(), Shown(platform::FileNameOf(outcome.source)));
     const bool bad = outcome.status != Status::Ok || outcome.skipped;
     failed += bad ? 1 : 0;
-    preview_->SetItem(row, 1, bad ? wxString("stays as it is") : Shown(platform::FileNameOf(outcome.destination)));
+    preview_->SetItem(row, 1, bad ? Label("unchanged") : Shown(platform::FileNameOf(outcome.destination)));
     if (bad) preview_->SetItemTextColour(row, ToWx(CurrentPalette().fault));
   }
   preview_->Thaw();
-  problem_->SetLabel(failed == 0 ? wxString() : wxString::Format("%zu of the files shown cannot get a new name.", failed));
+  problem_->SetLabel(failed == 0 ? wxString() : LabelCount("%1 of the files shown cannot be renamed.", "%1 of the files shown cannot be renamed.", failed));
 }
 
 std::optional<SequentialRenameRules> SequentialRenameDialog::Ask() {

@@ -21,12 +21,13 @@
 #include "platform/paths.h"
 #include "settings/configuration.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
 namespace {
 
-constexpr const char* kTitle = "File history";
+constexpr const char* kTitle = TrLater("File history");
 constexpr int kSmallSide = 32, kLargeSide = 96;  // device-independent pixels
 
 int ThumbnailSide() {
@@ -59,7 +60,7 @@ class FileHistoryBox::Lines : public wxDataViewVirtualListModel {
 };
 
 FileHistoryBox::FileHistoryBox(Shell& shell)
-    : wxDialog(&shell.Window(), wxID_ANY, kTitle, wxDefaultPosition, wxDefaultSize,
+    : wxDialog(&shell.Window(), wxID_ANY, Label(kTitle), wxDefaultPosition, wxDefaultSize,
                wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER | wxMAXIMIZE_BOX, "FileHistoryBox"),
       shell_(shell),
       thumbnails_([this](const std::vector<std::string>& paths) {
@@ -94,7 +95,7 @@ FileHistoryBox::~FileHistoryBox() { KeepPlaces(); }
 void FileHistoryBox::BuildList() {
   const long rules = settings.FileHistoryListRuleEnable != 0 ? wxDV_HORIZ_RULES : 0;
   list_ = new wxDataViewCtrl(this, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxDV_MULTIPLE | rules);
-  list_->SetName(kTitle);
+  list_->SetName(Label(kTitle));
   list_->AssociateModel(lines_.get());
   list_->Bind(wxEVT_DATAVIEW_ITEM_ACTIVATED, [this](wxDataViewEvent&) { ViewFile(); });
   list_->Bind(wxEVT_DATAVIEW_SELECTION_CHANGED, [this](wxDataViewEvent&) { UpdateControls(); });
@@ -123,7 +124,7 @@ void FileHistoryBox::AddColumns() {
                                                                   "wxDataViewIconText", wxDATAVIEW_CELL_INERT, middle))
                                                             : new wxDataViewTextRenderer("string", wxDATAVIEW_CELL_INERT, middle);
     list_->AppendColumn(
-        new wxDataViewColumn(facts.title, renderer, i, width, alignment, wxDATAVIEW_COL_RESIZABLE | wxDATAVIEW_COL_REORDERABLE));
+        new wxDataViewColumn(Label(facts.title), renderer, i, width, alignment, wxDATAVIEW_COL_RESIZABLE | wxDATAVIEW_COL_REORDERABLE));
   }
 }
 
@@ -144,10 +145,10 @@ void FileHistoryBox::Refill() {
 void FileHistoryBox::UpdateControls() {
   const size_t selected = SelectedRows().size();
   wxString text = settings.FileHistoryEnable == 0
-                      ? wxString("The file history is switched off; Options switches it on.")
-                      : wxString::Format(history_.Count() == 1 ? "%zu file" : "%zu files", history_.Count());
-  if (settings.FileHistoryEnable != 0 && selected > 1) text += wxString::Format(", %zu selected", selected);
-  if (!readable_) text = "The history file is there but cannot be read as one. Clear deletes it.";
+                      ? Label("The file history is disabled; Options enables it.")
+                      : LabelCount("%1 file", "%1 files", history_.Count());
+  if (settings.FileHistoryEnable != 0 && selected > 1) text += ", " + Label("%1 selected", selected);
+  if (!readable_) text = Label("The history file is not readable. Clear deletes it.");
   count_->SetLabel(text);
   for (const wxWindowID id : {wxID_OPEN, wxID_UP}) FindWindow(id)->Enable(selected == 1);
   FindWindow(wxID_DELETE)->Enable(selected > 0);
@@ -171,20 +172,20 @@ wxSizer* FileHistoryBox::BuildButtons() {
     void (FileHistoryBox::*run)();
   };
   static constexpr Button kButtons[] = {
-      {wxID_OPEN, "&View", &FileHistoryBox::ViewFile},
-      {wxID_UP, "Show in &folder", &FileHistoryBox::ShowFolder},
-      {wxID_DELETE, "&Remove", &FileHistoryBox::RemoveSelected},
-      {wxID_CLEAR, "&Clear", &FileHistoryBox::ClearAll},
-      {wxID_PREFERENCES, "&Options...", &FileHistoryBox::Options},
+      {wxID_OPEN, TrLater("&View"), &FileHistoryBox::ViewFile},
+      {wxID_UP, TrLater("Show in &folder"), &FileHistoryBox::ShowFolder},
+      {wxID_DELETE, TrLater("&Remove"), &FileHistoryBox::RemoveSelected},
+      {wxID_CLEAR, TrLater("&Clear"), &FileHistoryBox::ClearAll},
+      {wxID_PREFERENCES, TrLater("&Options..."), &FileHistoryBox::Options},
   };
   auto* row = new wxBoxSizer(wxHORIZONTAL);
   for (const Button& button : kButtons) {
-    row->Add(new wxButton(this, button.id, button.label), wxSizerFlags().Border(wxRIGHT, FromDIP(6)));
+    row->Add(new wxButton(this, button.id, Label(button.label)), wxSizerFlags().Border(wxRIGHT, FromDIP(6)));
     Bind(
         wxEVT_BUTTON, [this, run = button.run](wxCommandEvent&) { (this->*run)(); }, button.id);
   }
   row->AddStretchSpacer();
-  row->Add(new wxButton(this, wxID_CLOSE, "Close"));
+  row->Add(new wxButton(this, wxID_CLOSE, Label("Close")));
   return row;
 }
 
@@ -193,7 +194,7 @@ void FileHistoryBox::ViewFile() {
   if (rows.size() != 1) return;
   const std::string path = history_.Row(rows.front()).path;
   if (!platform::IsRegularFile(path)) {
-    wxMessageBox("The file is no longer there. Remove takes its entry out of the list.", kTitle, wxOK | wxICON_INFORMATION, this);
+    wxMessageBox(Label("The file no longer exists. Remove deletes its entry from the list."), Label(kTitle), wxOK | wxICON_INFORMATION, this);
     return;
   }
   Shell& shell = shell_;
@@ -216,10 +217,10 @@ void FileHistoryBox::ShowFolder() {
 
 bool FileHistoryBox::Confirm(const wxString& question, const wxString& verb) {
   if (settings.FileHistoryRemovePrompt == 0) return true;
-  wxRichMessageDialog dialog(this, question, verb + " history entries", wxYES_NO | wxNO_DEFAULT | wxICON_QUESTION);
-  dialog.SetExtendedMessage("The files themselves stay where they are.");
-  dialog.SetYesNoLabels("&" + verb, "&Keep");
-  dialog.ShowCheckBox("Do not ask again (Setup can turn the question on again)");
+  wxRichMessageDialog dialog(this, question, Label("File history"), wxYES_NO | wxNO_DEFAULT | wxICON_QUESTION);
+  dialog.SetExtendedMessage(Label("The files themselves are not affected."));
+  dialog.SetYesNoLabels("&" + verb, Label("&Keep"));
+  dialog.ShowCheckBox(Label("Do not ask again (can be re-enabled in Setup)"));
   LogEvent("question", Utf8(question));
   if (dialog.ShowModal() != wxID_YES) return false;
   if (dialog.IsCheckBoxChecked()) {
@@ -233,17 +234,17 @@ void FileHistoryBox::RemoveSelected() {
   const std::vector<size_t> rows = SelectedRows();
   if (rows.empty()) return;
   const wxString what = rows.size() == 1 ? "\"" + Shown(history_.Cell(rows.front(), choice::kColumnName)) + "\""
-                                         : wxString::Format("%zu entries", rows.size());
-  if (!Confirm("Take " + what + " out of the file history?", "Remove")) return;
+                                         : LabelCount("%1 entry", "%1 entries", rows.size());
+  if (!Confirm(Label("Remove %1 from the file history?", what), Label("Remove"))) return;
   if (!history_.Remove(rows))
-    wxMessageBox("The history file could not be written. The entries stay.", kTitle, wxOK | wxICON_WARNING, this);
+    wxMessageBox(Label("The history file could not be written. The entries were not removed."), Label(kTitle), wxOK | wxICON_WARNING, this);
   Refill();
 }
 
 void FileHistoryBox::ClearAll() {
-  if (!Confirm("Forget all files of the file history?", "Clear")) return;
+  if (!Confirm(Label("Remove all entries from the file history?"), Label("Clear"))) return;
   readable_ = history_.Clear();
-  if (!readable_) wxMessageBox("The history file could not be deleted.", kTitle, wxOK | wxICON_WARNING, this);
+  if (!readable_) wxMessageBox(Label("The history file could not be deleted."), Label(kTitle), wxOK | wxICON_WARNING, this);
   Refill();
 }
 
@@ -267,7 +268,7 @@ void FileHistoryBox::KeepPlaces() {
 }
 
 bool ShowFileHistorySetup(wxWindow* parent) {
-  return ShowSettingsBox(parent, "File history options", "FileHistorySetupBox", ItemsOf(SetupPage::History));
+  return ShowSettingsBox(parent, Label("File history options"), "FileHistorySetupBox", ItemsOf(SetupPage::History));
 }
 
 }  // namespace fotomill::desktop

@@ -14,7 +14,7 @@ namespace fotomill::desktop {
 
 class Shell;
 
-// The file history: which files were used last, for what, and when.
+// The file history: which files were recently used, for what, and when.
 class FileHistoryBox : public wxDialog {
  public:
   explicit FileHistoryBox(Shell& shell);

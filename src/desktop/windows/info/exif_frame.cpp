@@ -19,6 +19,7 @@
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "settings/job_options.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -28,11 +29,11 @@ ExifFrame::ExifFrame(wxWindow* parent, const std::string& path)
       path_(path) {
   const int gap = FromDIP(10);
   auto* panel = new wxPanel(this);
-  problem_ = new wxStaticText(panel, wxID_ANY, "Reading...");
+  problem_ = new wxStaticText(panel, wxID_ANY, Label("Reading..."));
   list_ = new wxDataViewListCtrl(panel, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxDV_SINGLE | wxDV_ROW_LINES);
-  list_->SetName("EXIF values");
-  list_->AppendTextColumn("Name", wxDATAVIEW_CELL_INERT, TextWidth(*this, 270));
-  list_->AppendTextColumn("Value", wxDATAVIEW_CELL_INERT, TextWidth(*this, 330));
+  list_->SetName(Label("EXIF values"));
+  list_->AppendTextColumn(Label("Name"), wxDATAVIEW_CELL_INERT, TextWidth(*this, 270));
+  list_->AppendTextColumn(Label("Value"), wxDATAVIEW_CELL_INERT, TextWidth(*this, 330));
   thumbnail_ = new wxStaticBitmap(panel, wxID_ANY, wxBitmapBundle());
   thumbnailFacts_ = new wxStaticText(panel, wxID_ANY, wxEmptyString);
 
@@ -44,12 +45,12 @@ ExifFrame::ExifFrame(wxWindow* parent, const std::string& path)
   middle->Add(side, wxSizerFlags().Border(wxLEFT, gap));
 
   const RowButton rows[] = {
-      {wxID_COPY, "&Copy value", [this] { CopyText(SelectedValue()); }},
-      {wxID_SELECTALL, "Copy &all", [this] { CopyText(wxString::FromUTF8(report_.text)); }},
-      {wxID_SAVEAS, "&Save as text...", [this] { SaveTextAs(*this, "exif.txt", report_.text); }},
-      {wxID_SAVE, "Save &thumbnail...", [this] { SaveThumbnail(); }},
-      {wxID_PRINT, "&Print...", [this] { PrintText(*this, GetTitle(), report_.text); }},
-      {wxID_CLOSE, "C&lose", [this] { Close(); }},
+      {wxID_COPY, TrLater("&Copy value"), [this] { CopyText(SelectedValue()); }},
+      {wxID_SELECTALL, TrLater("Copy &all"), [this] { CopyText(wxString::FromUTF8(report_.text)); }},
+      {wxID_SAVEAS, TrLater("&Save as text..."), [this] { SaveTextAs(*this, "exif.txt", report_.text); }},
+      {wxID_SAVE, TrLater("Save &thumbnail..."), [this] { SaveThumbnail(); }},
+      {wxID_PRINT, TrLater("&Print..."), [this] { PrintText(*this, GetTitle(), report_.text); }},
+      {wxID_CLOSE, TrLater("C&lose"), [this] { Close(); }},
   };
   wxSizer* buttons = BuildButtonRow(*this, *panel, rows);
   for (const RowButton& row : rows) FindWindow(row.id)->Enable(row.id == wxID_CLOSE);  // until the file is read
@@ -69,7 +70,7 @@ ExifFrame::ExifFrame(wxWindow* parent, const std::string& path)
       *this,
       [this, options = ExifTextOptionsFromSettings()](const StopToken&) { report_ = ReadExifReport(path_, options); },
       [this](Status status) {
-        if (status != Status::Ok) report_.problem = StatusMessage(status);
+        if (status != Status::Ok) report_.problem = Tr(StatusMessage(status));
         Finished();
       });
 }
@@ -86,13 +87,13 @@ void ExifFrame::Finished() {
   if (!report_.rows.empty()) list_->SelectRow(0);
   if (!report_.thumbnail.Empty()) {
     thumbnail_->SetBitmap(BitmapOf(report_.thumbnail, GetContentScaleFactor()));
-    thumbnail_->SetName("Thumbnail in the EXIF block");
+    thumbnail_->SetName(Label("Thumbnail in the EXIF block"));
   }
   if (!report_.thumbnailBytes.empty()) {
     const std::string size = report_.thumbnail.Empty()
-                                 ? "Thumbnail that cannot be decoded"
+                                 ? std::string(Tr("The thumbnail cannot be decoded"))
                                  : std::to_string(report_.thumbnail.width) + " x " + std::to_string(report_.thumbnail.height);
-    thumbnailFacts_->SetLabel(wxString::FromUTF8(size + "\n" + WithThousands(report_.thumbnailBytes.size()) + " bytes"));
+    thumbnailFacts_->SetLabel(wxString::FromUTF8(size + "\n" + TrCount("%1 byte", "%1 bytes", report_.thumbnailBytes.size())));
   }
   for (const wxWindowID id : {wxID_COPY, wxID_SELECTALL, wxID_SAVEAS, wxID_PRINT}) FindWindow(id)->Enable(!report_.rows.empty());
   FindWindow(wxID_SAVE)->Enable(!report_.thumbnailBytes.empty());
@@ -109,7 +110,7 @@ wxString ExifFrame::SelectedValue() const {
 
 void ExifFrame::SaveThumbnail() {
   const std::string name = std::string(platform::SplitPath(path_).base) + "_thumbnail.jpg";
-  wxFileDialog dialog(this, "Save thumbnail", wxEmptyString, Shown(name), "JPEG files (*.jpg)|*.jpg",
+  wxFileDialog dialog(this, Label("Save thumbnail"), wxEmptyString, Shown(name), Label("JPEG files (*.jpg)|*.jpg"),
                       wxFD_SAVE | wxFD_OVERWRITE_PROMPT);
   if (dialog.ShowModal() != wxID_OK) return;
   const std::string target = Utf8(dialog.GetPath());
@@ -117,9 +118,9 @@ void ExifFrame::SaveThumbnail() {
   const bool itself = other.kind == platform::FileKind::Regular && own.device == other.device && own.identity == other.identity;
   const std::string_view bytes(reinterpret_cast<const char*>(report_.thumbnailBytes.data()), report_.thumbnailBytes.size());
   if (itself) {
-    wxMessageBox("That is the picture itself. Choose another name.", "Save thumbnail", wxOK | wxICON_WARNING, this);
+    wxMessageBox(Label("This is the picture itself. Choose another name."), Label("Save thumbnail"), wxOK | wxICON_WARNING, this);
   } else if (!platform::WriteWholeFile(target, bytes)) {
-    wxMessageBox("The file \"" + dialog.GetPath() + "\" could not be written. Choose another folder or name.", "Save thumbnail",
+    wxMessageBox(Label("\"%1\" could not be written. Choose another folder or name.", dialog.GetPath()), Label("Save thumbnail"),
                  wxOK | wxICON_WARNING, this);
   }
 }

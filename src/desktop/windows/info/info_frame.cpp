@@ -16,14 +16,15 @@
 #include "desktop/windows/widgets/button_row.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/paths.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
 namespace {
 
 wxString TitleOf(const std::vector<std::string>& paths) {
-  if (paths.size() == 1) return "Get info: " + Shown(platform::FileNameOf(paths.front()));
-  return wxString::Format("Get info: %zu files", paths.size());
+  if (paths.size() == 1) return Label("Get info: %1", Shown(platform::FileNameOf(paths.front())));
+  return LabelCount("Get info: %1 file", "Get info: %1 files", paths.size());
 }
 
 constexpr int kProgressMs = 200;
@@ -38,7 +39,7 @@ InfoFrame::InfoFrame(Shell& shell, wxWindow* parent, std::vector<std::string> pa
   const int gap = FromDIP(10);
   auto* panel = new wxPanel(this);
   auto* column = new wxBoxSizer(wxVERTICAL);
-  problem_ = new wxStaticText(panel, wxID_ANY, "Reading...");
+  problem_ = new wxStaticText(panel, wxID_ANY, Label("Reading..."));
   column->Add(problem_, wxSizerFlags().Expand().Border(wxLEFT | wxTOP | wxRIGHT, gap));
   if (paths_.size() == 1) {
     tree_ = new ReportTree(panel);
@@ -46,7 +47,7 @@ InfoFrame::InfoFrame(Shell& shell, wxWindow* parent, std::vector<std::string> pa
   } else {
     auto* splitter = new wxSplitterWindow(panel, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxSP_LIVE_UPDATE | wxSP_NOBORDER);
     list_ = new wxListBox(splitter, wxID_ANY);
-    list_->SetName("Files");
+    list_->SetName(Label("Files"));
     tree_ = new ReportTree(splitter);
     splitter->SetMinimumPaneSize(FromDIP(80));
     splitter->SplitVertically(list_, tree_, FromDIP(220));
@@ -60,7 +61,7 @@ InfoFrame::InfoFrame(Shell& shell, wxWindow* parent, std::vector<std::string> pa
   tree_->SetFocus();
 
   timer_.Bind(wxEVT_TIMER, [this](wxTimerEvent&) {
-    problem_->SetLabel(wxString::Format("Reading file %zu of %zu...", read_.load() + 1, paths_.size()));
+    problem_->SetLabel(Label("Reading file %1 of %2...", read_.load() + 1, paths_.size()));
   });
   timer_.Start(kProgressMs);
   work_.Start(
@@ -78,10 +79,10 @@ InfoFrame::InfoFrame(Shell& shell, wxWindow* parent, std::vector<std::string> pa
 
 wxSizer* InfoFrame::BuildButtons(wxWindow& panel) {
   const RowButton rows[] = {
-      {wxID_COPY, "&Copy value", [this] { CopyText(tree_->SelectedValue()); }},
-      {wxID_SELECTALL, "Copy &all", [this] { CopyText(wxString::FromUTF8(WholeText())); }},
-      {wxID_SAVE, "&Save as text...", [this] { SaveTextAs(*this, "info.txt", WholeText()); }},
-      {wxID_CLOSE, "C&lose", [this] { Close(); }},
+      {wxID_COPY, TrLater("&Copy value"), [this] { CopyText(tree_->SelectedValue()); }},
+      {wxID_SELECTALL, TrLater("Copy &all"), [this] { CopyText(wxString::FromUTF8(WholeText())); }},
+      {wxID_SAVE, TrLater("&Save as text..."), [this] { SaveTextAs(*this, "info.txt", WholeText()); }},
+      {wxID_CLOSE, TrLater("C&lose"), [this] { Close(); }},
   };
   wxAcceleratorEntry keys[] = {{wxACCEL_CTRL, 'C', wxID_COPY},
                                {wxACCEL_CTRL | wxACCEL_SHIFT, 'C', wxID_SELECTALL},
@@ -101,7 +102,7 @@ void InfoFrame::Finished() {
   shell_.Uses().Note(uses);
   if (list_ != nullptr) {
     wxArrayString names;
-    names.Add(wxString::Format("All %zu files", files_.size()));
+    names.Add(LabelCount("All %1 files", "All %1 files", files_.size()));
     for (const FileInfo& file : files_) names.Add(Shown(platform::FileNameOf(file.path)));
     list_->Set(names);
     list_->SetSelection(0);

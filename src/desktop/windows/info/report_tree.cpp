@@ -6,9 +6,9 @@
 namespace fotomill::desktop {
 
 ReportTree::ReportTree(wxWindow* parent) : wxTreeListCtrl(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTL_SINGLE) {
-  SetName("Facts");
-  AppendColumn("Name", TextWidth(*this, 260), wxALIGN_LEFT, wxCOL_RESIZABLE);
-  AppendColumn("Value", TextWidth(*this, 360), wxALIGN_LEFT, wxCOL_RESIZABLE);
+  SetName(Label("Facts"));
+  AppendColumn(Label("Name"), TextWidth(*this, 260), wxALIGN_LEFT, wxCOL_RESIZABLE);
+  AppendColumn(Label("Value"), TextWidth(*this, 360), wxALIGN_LEFT, wxCOL_RESIZABLE);
 }
 
 void ReportTree::Show(std::span<const InfoSection> sections) {

@@ -19,7 +19,7 @@ namespace {
 constexpr int kLinesOfAPage = 66;
 constexpr size_t kCharactersOfALine = 92;
 
-// Lines of a text as they fit on paper: tabs are blanks, long lines go on in the next.
+// Lines of a text as they fit on paper: tabs are blanks, long lines continue in the next.
 wxArrayString PrintedLines(const std::string& text) {
   wxArrayString lines;
   wxStringTokenizer tokens(wxString::FromUTF8(text.data(), text.size()), "\n", wxTOKEN_RET_EMPTY);
@@ -75,11 +75,11 @@ void CopyText(const wxString& text) {
 }
 
 void SaveTextAs(wxWindow& parent, const wxString& name, const std::string& text) {
-  wxFileDialog dialog(&parent, "Save as text", wxEmptyString, name, "Text files (*.txt)|*.txt|All files|*",
+  wxFileDialog dialog(&parent, Label("Save as text"), wxEmptyString, name, Label("Text files (*.txt)|*.txt|All files|*"),
                       wxFD_SAVE | wxFD_OVERWRITE_PROMPT);
   if (dialog.ShowModal() != wxID_OK) return;
   if (platform::WriteWholeFile(Utf8(dialog.GetPath()), text)) return;
-  wxMessageBox("The file \"" + dialog.GetPath() + "\" could not be written. Choose another folder or name.", "Save as text",
+  wxMessageBox(Label("\"%1\" could not be written. Choose another folder or name.", dialog.GetPath()), Label("Save as text"),
                wxOK | wxICON_WARNING, &parent);
 }
 
@@ -87,7 +87,7 @@ void PrintText(wxWindow& parent, const wxString& title, const std::string& text)
   wxPrinter printer;
   TextPrintout printout(title, text);
   if (!printer.Print(&parent, &printout, true) && wxPrinter::GetLastError() == wxPRINTER_ERROR) {
-    wxMessageBox("Printer error.", "Print", wxOK | wxICON_WARNING, &parent);
+    wxMessageBox(Label("Printer error."), Label("Print"), wxOK | wxICON_WARNING, &parent);
   }
 }
 

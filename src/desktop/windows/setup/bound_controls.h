@@ -28,7 +28,7 @@ class BoundControls : public SetupDialog {
   void Select(uint32_t control, int32_t position) override;
   int32_t Selected(uint32_t control) const override;
 
-  // The window of a control, null when there is none.
+  // The window of a control, null if there is none.
   wxWindow* Find(uint32_t control) const { return root_.FindWindow(static_cast<long>(control)); }
 
  private:

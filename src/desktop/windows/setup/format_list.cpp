@@ -7,6 +7,7 @@
 #include "desktop/windows/widgets/wx_text.h"
 #include "registry/registry.h"
 #include "settings/format_switches.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -16,19 +17,19 @@ enum Column { kOnColumn, kFormatColumn, kBuildColumn };
 
 wxString WorksHere(const FormatEntry& row) {
   const bool reads = CanRead(row), writes = CanWrite(row);
-  if (reads && writes) return "reads and writes";
-  if (reads || writes) return reads ? "reads" : "writes";
-  return "not in this build";
+  if (reads && writes) return Tr("read and write");
+  if (reads || writes) return reads ? Tr("read") : Tr("write");
+  return Tr("not in this build");
 }
 
 }  // namespace
 
 FormatList::FormatList(wxWindow* parent)
     : wxDataViewListCtrl(parent, wxID_ANY, wxDefaultPosition, parent->FromDIP(wxSize(-1, 280)), wxDV_SINGLE | wxDV_ROW_LINES) {
-  SetName("Formats");
-  AppendToggleColumn("On", wxDATAVIEW_CELL_ACTIVATABLE, FromDIP(50), wxALIGN_CENTER);
-  AppendTextColumn("Format", wxDATAVIEW_CELL_INERT, TextWidth(*this, 300));
-  AppendTextColumn("In this build", wxDATAVIEW_CELL_INERT, TextWidth(*this, 150));
+  SetName(Label("Formats"));
+  AppendToggleColumn(Label("On"), wxDATAVIEW_CELL_ACTIVATABLE, FromDIP(50), wxALIGN_CENTER);
+  AppendTextColumn(Label("Format"), wxDATAVIEW_CELL_INERT, TextWidth(*this, 300));
+  AppendTextColumn(Label("In this build"), wxDATAVIEW_CELL_INERT, TextWidth(*this, 150));
   for (const int32_t index : FormatListRows()) {
     const FormatEntry& row = FormatRow(index);
     wxVector<wxVariant> cells;
@@ -62,7 +63,7 @@ void FormatList::Turn(const wxDataViewItem& item) {
   const SaveResult saved = SwitchFormat(index, on);
   LogEvent("formats", Utf8(GetTextValue(line, kFormatColumn)) + (on ? " on" : " off"));
   if (saved == SaveResult::Done || saved == SaveResult::Unchanged) return;
-  wxMessageBox(Shown(std::string(SaveMessage(saved)) + " The switch is turned until the program ends."), "Formats",
+  wxMessageBox(Shown(Tr(SaveMessage(saved))) + " " + Label("The change applies until the program exits."), Label("Formats"),
                wxOK | wxICON_WARNING, wxGetTopLevelParent(this));
 }
 

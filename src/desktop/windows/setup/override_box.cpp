@@ -22,7 +22,7 @@ bool HasOverrideBox(std::string_view extension) { return FindOverrideOptions(ext
 bool ShowOverrideBox(wxWindow* parent, std::string_view extension) {
   const FormatSettings* const options = FindOverrideOptions(extension);
   if (options == nullptr) return false;
-  return ShowSettingsBox(parent, wxString(options->extension) + " options", options->box, ItemsOf(*options));
+  return ShowSettingsBox(parent, Label("%1 options", options->extension), options->box, ItemsOf(*options));
 }
 
 bool ShiftOpensOverrideBox() { return settings.AllowDestinationOverrides != 0; }

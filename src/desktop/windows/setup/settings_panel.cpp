@@ -2,6 +2,7 @@
 
 #include <wx/checkbox.h>
 #include <wx/choice.h>
+#include <wx/dataview.h>
 #include <wx/gbsizer.h>
 #include <wx/sizer.h>
 #include <wx/spinctrl.h>
@@ -17,6 +18,7 @@
 #include "desktop/windows/setup/color_button.h"
 #include "desktop/windows/setup/mask_list.h"
 #include "desktop/windows/widgets/wx_text.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -29,7 +31,7 @@ enum Column { kMarkColumn, kLabelColumn, kControlColumn };
 
 wxArrayString FunctionNames() {
   wxArrayString names;
-  for (int32_t function = 0; function < kFileFunctionCount; ++function) names.Add(Shown(FileFunctionName(function)));
+  for (int32_t function = 0; function < kFileFunctionCount; ++function) names.Add(Shown(Tr(FileFunctionName(function))));
   return names;
 }
 
@@ -53,7 +55,7 @@ wxWindow* MakeSpin(wxWindow* box, const KeyRow& row, wxWindowID id) {
 wxWindow* MakeControl(wxWindow* box, const SetupItem& item) {
   const KeyRow& row = KeyOf(item.key);
   const auto id = static_cast<wxWindowID>(row.control);
-  const wxString label = wxString::FromUTF8(item.label);
+  const wxString label = Label(item.label);
   if ((row.type & KEY_FLAG) != 0) return new wxCheckBox(box, id, label);
   if (IsFunctionMask(item.key)) return new MaskList(box, id, FunctionNames());
   if ((row.type & KEY_CHOICE) != 0) return new wxChoice(box, id);
@@ -72,14 +74,18 @@ SettingsPanel::SettingsPanel(wxWindow* parent, std::vector<SetupItem> items, std
       items_(std::move(items)) {
   const int gap = FromDIP(8);
   auto* column = new wxBoxSizer(wxVERTICAL);
-  if (above) column->Add(above(this), wxSizerFlags(1).Expand().Border(wxALL, gap));
+  if (above) {
+    wxWindow* const window = above(this);
+    const bool list = dynamic_cast<wxDataViewCtrl*>(window) != nullptr;  // takes the free space
+    column->Add(window, wxSizerFlags(list ? 1 : 0).Expand().Border(wxALL, gap));
+  }
   const char* group = nullptr;
   wxStaticBoxSizer* box = nullptr;
   wxGridBagSizer* grid = nullptr;
   for (const SetupItem& item : items_) {
     if (group == nullptr || std::string_view(group) != item.group) {
       group = item.group;
-      box = new wxStaticBoxSizer(wxVERTICAL, this, wxString::FromUTF8(group));
+      box = new wxStaticBoxSizer(wxVERTICAL, this, Label(group));
       grid = new wxGridBagSizer(FromDIP(6), FromDIP(6));
       grid->SetEmptyCellSize(wxSize(0, 0));
       box->Add(grid, wxSizerFlags().Expand().Border(wxALL, FromDIP(6)));
@@ -110,9 +116,9 @@ void SettingsPanel::AddItem(wxWindow* box, wxSizer* sizer, const SetupItem& item
   const int line = grid->GetRows();
   auto* mark = new wxStaticText(box, wxID_ANY, kMark);
   mark->SetMinSize(FromDIP(wxSize(12, -1)));
-  mark->SetToolTip("Not the default.");
+  mark->SetToolTip(Label("Not the default."));
   marks_.push_back(mark);
-  const wxString text = wxString::FromUTF8(item.label);
+  const wxString text = Label(item.label);
   const bool flag = (row.type & KEY_FLAG) != 0;
   wxStaticText* label = flag ? nullptr : new wxStaticText(box, wxID_ANY, text);
   wxWindow* control = MakeControl(box, item);

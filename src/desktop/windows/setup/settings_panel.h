@@ -17,7 +17,7 @@ namespace fotomill::desktop {
 // show their default. It fills nothing: whoever made it binds its controls.
 class SettingsPanel : public wxScrolledWindow {
  public:
-  // `changed` is called after the user changed a control. `above` stands on top of the groups, if given.
+  // `changed` is called after the user changed a control. `above` is on top of the groups, if given.
   SettingsPanel(wxWindow* parent, std::vector<SetupItem> items, std::function<void()> changed,
                 const std::function<wxWindow*(wxWindow*)>& above = {});
 

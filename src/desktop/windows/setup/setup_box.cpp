@@ -19,24 +19,26 @@
 #include "desktop/windows/batch/batch_runner.h"
 #include "desktop/windows/dialogs/help.h"
 #include "desktop/windows/setup/format_list.h"
+#include "desktop/windows/setup/language_panel.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/looks.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/files.h"
 #include "settings/configuration.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
 namespace {
 
-constexpr const char* kSetupTitle = "Setup";
-constexpr const char* kTransferFiles = "Settings (*.ini)|*.ini|All files|*";
+constexpr const char* kSetupTitle = TrLater("Setup");
+constexpr const char* kTransferFiles = TrLater("Settings (*.ini)|*.ini|All files|*");
 
 // Settings never change during a batch. False after a message when one is running.
 bool MayChangeSettings(wxWindow& window) {
   auto* const shell = dynamic_cast<Shell*>(wxTheApp->GetTopWindow());
   if (shell == nullptr || !shell->Batches().Running()) return true;
-  wxMessageBox("A batch is running with the settings as they are. Change them when it has ended.", kSetupTitle,
+  wxMessageBox(Label("A batch is running with the current settings. Change them when it has finished."), Label(kSetupTitle),
                wxOK | wxICON_INFORMATION, &window);
   return false;
 }
@@ -47,14 +49,14 @@ bool ReadSettings(wxWindow& window, const BoundControls& controls, const std::fu
   if (!MayChangeSettings(window)) return false;
   if (const auto fault = ReadSetupDialog(controls, destinations)) {
     show(fault->control);
-    wxMessageBox(Shown(fault->message), kSetupTitle, wxOK | wxICON_WARNING, &window);
+    wxMessageBox(Shown(fault->message), Label(kSetupTitle), wxOK | wxICON_WARNING, &window);
     if (wxWindow* control = controls.Find(fault->control)) control->SetFocus();
     return false;
   }
   const SaveResult saved = SaveConfiguration();
   changed = saved != SaveResult::Unchanged;
-  if (const std::string_view message = SaveMessage(saved); !message.empty()) {
-    wxMessageBox(Shown(std::string(message) + " The settings count until the program ends."), kSetupTitle, wxOK | wxICON_WARNING,
+  if (const std::string message = Tr(SaveMessage(saved)); !message.empty()) {
+    wxMessageBox(Shown(message) + " " + Label("The settings apply until the program exits."), Label(kSetupTitle), wxOK | wxICON_WARNING,
                  &window);
   }
   return true;
@@ -63,19 +65,19 @@ bool ReadSettings(wxWindow& window, const BoundControls& controls, const std::fu
 }  // namespace
 
 SetupBox::SetupBox(wxWindow* parent, std::function<void()> applied, SetupPage first)
-    : wxDialog(parent, wxID_ANY, kSetupTitle, wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
+    : wxDialog(parent, wxID_ANY, Label(kSetupTitle), wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
                "SetupBox"),
       applied_(std::move(applied)),
       controls_(*this),
       page_(first) {
   const int gap = FromDIP(10);
   search_ = new wxSearchCtrl(this, wxID_ANY, wxEmptyString, wxDefaultPosition, FromDIP(wxSize(230, -1)));
-  search_->SetDescriptiveText("Search settings");
+  search_->SetDescriptiveText(Label("Search settings"));
   search_->ShowCancelButton(true);
-  search_->SetName("Search settings");
+  search_->SetName(Label("Search settings"));
   list_ = new wxListBox(this, wxID_ANY, wxDefaultPosition, wxDefaultSize, 0, nullptr, wxLB_SINGLE);
-  list_->SetName("Pages");
-  title_ = new wxStaticText(this, wxID_ANY, TitleOf(first));
+  list_->SetName(Label("Pages"));
+  title_ = new wxStaticText(this, wxID_ANY, Label(TitleOf(first)));
   title_->SetFont(title_->GetFont().Bold().Scaled(1.3f));
   BuildPages();
 
@@ -125,11 +127,15 @@ void SetupBox::BuildPages() {
   book_ = new wxSimplebook(this);
   for (size_t page = 0; page < kSetupPageCount; ++page) {
     std::function<wxWindow*(wxWindow*)> above;
-    if (static_cast<SetupPage>(page) == SetupPage::Formats)
+    if (static_cast<SetupPage>(page) == SetupPage::Formats) {
       above = [](wxWindow* parent) -> wxWindow* { return new FormatList(parent); };
+    }
+    if (static_cast<SetupPage>(page) == SetupPage::Browsing) {
+      above = [this](wxWindow* parent) -> wxWindow* { return language_ = new LanguagePanel(parent); };
+    }
     auto* panel = new SettingsPanel(
         book_, ItemsOf(static_cast<SetupPage>(page)), [this] { ControlChanged(); }, above);
-    book_->AddPage(panel, TitleOf(static_cast<SetupPage>(page)));
+    book_->AddPage(panel, Label(TitleOf(static_cast<SetupPage>(page))));
     panels_.push_back(panel);
   }
 }
@@ -142,9 +148,9 @@ void SetupBox::ShowPages() {
   found_ = FindSettings(words);
   wxArrayString lines;
   if (searching_) {
-    for (const SetupItem& item : found_) lines.Add(wxString(item.group) + ": " + item.label);
+    for (const SetupItem& item : found_) lines.Add(Label(item.group) + ": " + Label(item.label));
   } else {
-    for (size_t page = 0; page < kSetupPageCount; ++page) lines.Add(TitleOf(static_cast<SetupPage>(page)));
+    for (size_t page = 0; page < kSetupPageCount; ++page) lines.Add(Label(TitleOf(static_cast<SetupPage>(page))));
   }
   list_->Set(lines);
   if (searching_ && !found_.empty()) {
@@ -173,7 +179,7 @@ void SetupBox::ChooseLine(bool focus) {
 void SetupBox::ShowPage(SetupPage page) {
   page_ = page;
   book_->SetSelection(static_cast<size_t>(page));
-  title_->SetLabel(TitleOf(page));
+  title_->SetLabel(Label(TitleOf(page)));
   if (!searching_) list_->SetSelection(static_cast<int>(page));
   LogEvent("setup", std::string("page=") + TitleOf(page) + " found=" + std::to_string(found_.size()));
 }
@@ -191,16 +197,17 @@ wxSizer* SetupBox::BuildButtons() {
     void (SetupBox::*run)();
   };
   static constexpr Button kButtons[] = {
-      {"&Reset page", "Gives every setting of this page its default. Nothing is saved before OK or Apply.", &SetupBox::ResetPage},
-      {"&Import...", "Takes settings from a file.", &SetupBox::Import},
-      {"&Export...", "Writes the saved settings to a file.", &SetupBox::Export},
-      {"Open &data folder", "Shows the folder of the settings, the file history and the global thumbnail database.",
+      {TrLater("&Reset page"), TrLater("Resets every setting of this page. Nothing is saved before OK or Apply."),
+       &SetupBox::ResetPage},
+      {TrLater("&Import..."), TrLater("Reads settings from a file."), &SetupBox::Import},
+      {TrLater("&Export..."), TrLater("Writes the saved settings to a file."), &SetupBox::Export},
+      {TrLater("Open &data folder"), TrLater("Opens the folder of the settings, the file history and the global thumbnail database."),
        &SetupBox::OpenDataFolder},
   };
   auto* row = new wxBoxSizer(wxHORIZONTAL);
   for (const Button& button : kButtons) {
-    auto* control = new wxButton(this, wxID_ANY, button.label);
-    control->SetToolTip(button.tip);
+    auto* control = new wxButton(this, wxID_ANY, Label(button.label));
+    control->SetToolTip(Label(button.tip));
     control->Bind(wxEVT_BUTTON, [this, run = button.run](wxCommandEvent&) { (this->*run)(); });
     row->Add(control, wxSizerFlags().Border(wxRIGHT, FromDIP(6)));
   }
@@ -228,6 +235,7 @@ bool SetupBox::Apply() {
     }
   };
   if (!ReadSettings(*this, controls_, show, changed)) return false;
+  language_->Store();
   if (TakeSetupChanged() || changed) applied_();
   LogEvent("setup", changed ? "applied changed=1" : "applied changed=0");
   return true;
@@ -242,7 +250,7 @@ void SetupBox::ResetPage() {
 
 void SetupBox::Import() {
   if (!MayChangeSettings(*this)) return;
-  wxFileDialog dialog(this, "Import settings", wxEmptyString, wxEmptyString, kTransferFiles, wxFD_OPEN | wxFD_FILE_MUST_EXIST);
+  wxFileDialog dialog(this, Label("Import settings"), wxEmptyString, wxEmptyString, Label(kTransferFiles), wxFD_OPEN | wxFD_FILE_MUST_EXIST);
   if (dialog.ShowModal() != wxID_OK) return;
   const Transfer transfer = ImportConfiguration(Utf8(dialog.GetPath()));
   FillSetupDialog(controls_, destinations_);
@@ -252,7 +260,7 @@ void SetupBox::Import() {
 }
 
 void SetupBox::Export() {
-  wxFileDialog dialog(this, "Export settings", wxEmptyString, "Fotomill settings.ini", kTransferFiles,
+  wxFileDialog dialog(this, Label("Export settings"), wxEmptyString, "Fotomill settings.ini", Label(kTransferFiles),
                       wxFD_SAVE | wxFD_OVERWRITE_PROMPT);
   if (dialog.ShowModal() != wxID_OK) return;
   const Transfer transfer = ExportConfiguration(Utf8(dialog.GetPath()));
@@ -261,14 +269,14 @@ void SetupBox::Export() {
 
 void SetupBox::OpenDataFolder() {
   const std::string& folder = DataFolder();
-  if (folder.empty() || !platform::MakeFolders(folder)) return Report(false, "There is no data folder, and none could be made.");
+  if (folder.empty() || !platform::MakeFolders(folder)) return Report(false, Tr("There is no data folder, and it could not be created."));
   if (!wxLaunchDefaultApplication(wxString::FromUTF8(folder))) {
-    Report(false, "No program could be found that shows the folder \"" + folder + "\".");
+    Report(false, Tr("No program was found to open the folder \"%1\".", folder));
   }
 }
 
 void SetupBox::Report(bool ok, const std::string& message) {
-  wxMessageBox(Shown(message), kSetupTitle, wxOK | (ok ? wxICON_INFORMATION : wxICON_WARNING), this);
+  wxMessageBox(Shown(message), Label(kSetupTitle), wxOK | (ok ? wxICON_INFORMATION : wxICON_WARNING), this);
 }
 
 // --- a few settings ---
@@ -283,8 +291,8 @@ bool ShowSettingsBox(wxWindow* parent, const wxString& title, const wxString& na
   });
   FillSetupDialog(controls, destinations);
   panel->UpdateMarks(controls);
-  auto* reset = new wxButton(&dialog, wxID_ANY, "&Reset");
-  reset->SetToolTip("Gives all of these settings their defaults.");
+  auto* reset = new wxButton(&dialog, wxID_ANY, Label("&Reset"));
+  reset->SetToolTip(Label("Resets all of these settings."));
   reset->Bind(wxEVT_BUTTON, [&](wxCommandEvent&) {
     FillSetupDialog(controls, destinations, panel->Rows(), SetupValues::Default);
     panel->UpdateMarks(controls);

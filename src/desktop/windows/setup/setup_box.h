@@ -5,6 +5,7 @@
 #include <functional>
 #include <vector>
 
+#include "desktop/windows/setup/language_panel.h"
 #include "desktop/windows/setup/settings_panel.h"
 
 class wxListBox;
@@ -39,6 +40,7 @@ class SetupBox : public wxDialog {
   BoundControls controls_;
   RegistryDestinations destinations_;
   std::vector<SettingsPanel*> panels_;
+  LanguagePanel* language_ = nullptr;
   std::vector<SetupItem> found_;  // what the list shows while something is searched for
   bool searching_ = false;
   SetupPage page_;

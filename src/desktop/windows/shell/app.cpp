@@ -1,8 +1,9 @@
 #include <wx/app.h>
 #include <wx/cmdline.h>
+#include <wx/image.h>
+#include <wx/translation.h>
 #include <wx/weakref.h>
 
-#include <wx/image.h>
 #include <cstdlib>
 #include <functional>
 #include <memory>
@@ -10,6 +11,7 @@
 
 #include "core/data_folder.h"
 #include "desktop/models/files/previous_file.h"
+#include "desktop/models/setup/language_choice.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/models/view/view_picture.h"
 #include "desktop/windows/setup/override_box.h"
@@ -49,10 +51,18 @@ std::string NameOfInstance() {
 
 class App : public wxApp {
  public:
+  // The language comes first: the toolkits choose theirs when they start.
+  bool Initialize(int& count, wxChar** arguments) override {
+    SetDataFolder({});
+    (void)LoadConfiguration();
+    (void)StartTexts(StoredLanguage());
+    return wxApp::Initialize(count, arguments);
+  }
+
   void OnInitCmdLine(wxCmdLineParser& parser) override {
     parser.SetSwitchChars("-");
-    parser.AddSwitch("h", "help", "tells how to call the program", wxCMD_LINE_OPTION_HELP);
-    parser.AddLongSwitch(kNewInstance, "opens a frame of its own, even where the program is running");
+    parser.AddSwitch("h", "help", Label("show this help"), wxCMD_LINE_OPTION_HELP);
+    parser.AddLongSwitch(kNewInstance, Label("open a new window even if the program is already running"));
     parser.AddParam("FOLDER or FILE", wxCMD_LINE_VAL_STRING, wxCMD_LINE_PARAM_OPTIONAL);
   }
   bool OnCmdLineParsed(wxCmdLineParser& parser) override {
@@ -63,12 +73,12 @@ class App : public wxApp {
 
   bool OnInit() override {
     platform::FillStandardStreams();
+    StartTranslations();
     StartEventLog();
     SetAppName("fotomill-desktop");
     SetAppDisplayName("Fotomill Professional");
     if (!wxApp::OnInit()) return false;
     wxImage::AddHandler(new wxPNGHandler);  // pictures travel over the clipboard as PNG
-    SetDataFolder({});
     if (!newInstance_ && HandOver()) return true;
     (void)LoadConfiguration();
     TakeFormatSwitches();
@@ -112,6 +122,15 @@ class App : public wxApp {
 
  private:
   static constexpr const char* kNewInstance = "new-instance";
+
+  // The toolkit sets the locale when it starts, so the texts choose theirs again.
+  void StartTranslations() {
+    (void)StartTexts(StoredLanguage());
+    auto* const translations = new wxTranslations;
+    wxTranslations::Set(translations);
+    translations->SetLanguage(wxString::FromUTF8(TextLanguage()));
+    translations->AddStdCatalog();
+  }
 
   bool HandOver() {
     const auto standing = firstStart_.Begin(NameOfInstance(), argument_, kHandOverSeconds);

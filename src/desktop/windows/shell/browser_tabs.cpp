@@ -14,6 +14,7 @@
 #include "platform/folders.h"
 #include "platform/paths.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -112,7 +113,7 @@ void BrowserTabs::Close() {
 void BrowserTabs::Reopen() {
   const auto folder = closed_.Pop();
   if (!folder) return;
-  if (!platform::IsFolder(*folder)) return shell_.Report(*folder + " is not there any more.");
+  if (!platform::IsFolder(*folder)) return shell_.Report(Tr("%1 no longer exists.", *folder));
   Open(*folder);
 }
 
@@ -125,7 +126,7 @@ void BrowserTabs::OnTabChanged(wxAuiNotebookEvent& event) {
   const int left = event.GetOldSelection();
   if (left != wxNOT_FOUND && static_cast<size_t>(left) < book_->GetPageCount()) PageAt(static_cast<size_t>(left))->KeepColumns();
   for (wxWindow* const window : book_->GetChildren()) {
-    if (dynamic_cast<wxAuiTabCtrl*>(window) != nullptr) window->SetName("Tabs");
+    if (dynamic_cast<wxAuiTabCtrl*>(window) != nullptr) window->SetName(Label("Tabs"));
   }
   if (BrowserPage* browser = Front()) {
     browser->Activated();

@@ -14,6 +14,7 @@
 #include "desktop/windows/shell/picture_windows.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/shell/tool_windows.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -110,103 +111,103 @@ void View(Shell& shell) {
   if (!files.empty()) shell.Pictures().ViewFromBrowser(files.front());
 }
 
-constexpr const char* kFile = "&File";
-constexpr const char* kEdit = "&Edit";
-constexpr const char* kView = "&View";
-constexpr const char* kGo = "&Go";
-constexpr const char* kFunctions = "F&unctions";
-constexpr const char* kTools = "&Tools";
-constexpr const char* kHelp = "&Help";
+constexpr const char* kFile = TrLater("&File");
+constexpr const char* kEdit = TrLater("&Edit");
+constexpr const char* kView = TrLater("&View");
+constexpr const char* kGo = TrLater("&Go");
+constexpr const char* kFunctions = TrLater("F&unctions");
+constexpr const char* kTools = TrLater("&Tools");
+constexpr const char* kHelp = TrLater("&Help");
 
 // clang-format off
 constexpr Command kCommands[] = {
-    {kFile, "New &tab",            "Ctrl+T",       "Opens another tab on this folder.", Needs::Nothing, NewTab},
-    {kFile, "&Close tab",          "Ctrl+W",       "Closes this tab.", Needs::Nothing, CloseTab},
-    {kFile, "&Reopen closed tab",  "Ctrl+Shift+T", "Opens the tab that was closed last.", Needs::ClosedTab, ReopenTab},
-    {kFile, "&Save tabs as...",     "",             "Keeps the tabs under a name.", Needs::Nothing, SaveTabSet},
-    {kFile, "T&ab sets...",         "",             "Opens tabs that were kept under a name.", Needs::Nothing, OpenTabSet},
+    {kFile, TrLater("New &tab"),            "Ctrl+T",       TrLater("Opens this folder in a new tab."), Needs::Nothing, NewTab},
+    {kFile, TrLater("&Close tab"),          "Ctrl+W",       TrLater("Closes this tab."), Needs::Nothing, CloseTab},
+    {kFile, TrLater("&Reopen closed tab"),  "Ctrl+Shift+T", TrLater("Reopens the last closed tab."), Needs::ClosedTab, ReopenTab},
+    {kFile, TrLater("&Save tabs as..."),     "",             TrLater("Saves the open tabs under a name."), Needs::Nothing, SaveTabSet},
+    {kFile, TrLater("T&ab sets..."),         "",             TrLater("Opens a saved set of tabs."), Needs::Nothing, OpenTabSet},
     {kFile, nullptr},
-    {kFile, "New &folder...",      "Ctrl+Shift+N", "Makes a folder in this one.", Needs::Nothing, NewFolder},
+    {kFile, TrLater("New &folder..."),      "Ctrl+Shift+N", TrLater("Creates a folder in this folder."), Needs::Nothing, NewFolder},
     {kFile, nullptr},
-    {kFile, "&Quit",               "Ctrl+Q",       "Ends the program.", Needs::Nothing, Quit},
+    {kFile, TrLater("&Quit"),               "Ctrl+Q",       TrLater("Quits the program."), Needs::Nothing, Quit},
 
-    {kEdit, "&Undo",               "Ctrl+Z",       "Takes the last thing done to files back.", Needs::Undo, OfFiles<&FileActions::Undo>},
-    {kEdit, "Re&do",               "Ctrl+Y",       "Does again what was taken back.", Needs::Redo, OfFiles<&FileActions::Redo>},
+    {kEdit, TrLater("&Undo"),               "Ctrl+Z",       TrLater("Undoes the last file operation."), Needs::Undo, OfFiles<&FileActions::Undo>},
+    {kEdit, TrLater("Re&do"),               "Ctrl+Y",       TrLater("Redoes the last undone file operation."), Needs::Redo, OfFiles<&FileActions::Redo>},
     {kEdit, nullptr},
-    {kEdit, "Cu&t",                "Ctrl+X",       "Puts the files on the clipboard, to be moved.", Needs::Item, Cut},
-    {kEdit, "&Copy",               "Ctrl+C",       "Puts the files on the clipboard, to be copied.", Needs::Item, Copy, nullptr, true},
-    {kEdit, "&Paste",              "Ctrl+V",       "Copies or moves the files of the clipboard to this folder; a picture becomes a file.", Needs::Nothing, Paste},
-    {kEdit, "Copy pat&hs",         "Ctrl+Shift+C", "Puts the paths of the files on the clipboard as text.", Needs::Item, CopyPaths, nullptr, true},
+    {kEdit, TrLater("Cu&t"),                "Ctrl+X",       TrLater("Cuts the selected files to the clipboard."), Needs::Item, Cut},
+    {kEdit, TrLater("&Copy"),               "Ctrl+C",       TrLater("Copies the selected files to the clipboard."), Needs::Item, Copy, nullptr, true},
+    {kEdit, TrLater("&Paste"),              "Ctrl+V",       TrLater("Pastes files from the clipboard into this folder; a picture is saved as a file."), Needs::Nothing, Paste},
+    {kEdit, TrLater("Copy pat&hs"),         "Ctrl+Shift+C", TrLater("Copies the paths of the selected files as text."), Needs::Item, CopyPaths, nullptr, true},
     {kEdit, nullptr},
-    {kEdit, "&Rename...",          "F2",           "Gives the focused file another name.", Needs::Item, OfBrowser<&BrowserPage::EditFocusedName>, nullptr, true},
+    {kEdit, TrLater("&Rename..."),          "F2",           TrLater("Renames the focused file."), Needs::Item, OfBrowser<&BrowserPage::EditFocusedName>, nullptr, true},
     {kEdit, nullptr},
-    {kEdit, "Select &all",         "Ctrl+A",       "Selects all files that are shown.", Needs::Nothing, Select<&Selection::SelectAll>},
-    {kEdit, "Select &none",        "Ctrl+Shift+A", "Selects nothing.", Needs::Nothing, Select<&Selection::SelectNone>},
-    {kEdit, "&Invert selection",   "Ctrl+I",       "Selects what is not selected.", Needs::Nothing, Select<&Selection::Invert>},
-    {kEdit, "Select by p&attern...", "Ctrl+S",     "Selects files by a part of their names, or a pattern.", Needs::Nothing, SelectByPattern},
-    {kEdit, "Select same t&ype",   "",             "Selects all files of the focused file's type.", Needs::Item, SelectSameType},
+    {kEdit, TrLater("Select &all"),         "Ctrl+A",       TrLater("Selects all visible files."), Needs::Nothing, Select<&Selection::SelectAll>},
+    {kEdit, TrLater("Select &none"),        "Ctrl+Shift+A", TrLater("Clears the selection."), Needs::Nothing, Select<&Selection::SelectNone>},
+    {kEdit, TrLater("&Invert selection"),   "Ctrl+I",       TrLater("Selects the other files."), Needs::Nothing, Select<&Selection::Invert>},
+    {kEdit, TrLater("Select by p&attern..."), "Ctrl+S",     TrLater("Selects files by part of their name or by a pattern."), Needs::Nothing, SelectByPattern},
+    {kEdit, TrLater("Select same t&ype"),   "",             TrLater("Selects all files of the focused file's type."), Needs::Item, SelectSameType},
     {kEdit, nullptr},
-    {kEdit, "&Filter",             "Ctrl+F",       "Shows only files whose names match.", Needs::Nothing, OfBrowser<&BrowserPage::EditFilter>},
+    {kEdit, TrLater("&Filter"),             "Ctrl+F",       TrLater("Shows only files whose names match."), Needs::Nothing, OfBrowser<&BrowserPage::EditFilter>},
 
-    {kView, "&List",               "Ctrl+1",       "Shows names only.", Needs::Nothing, ShowAs<choice::kViewList>, nullptr, false, Has<&BrowserModes::view, choice::kViewList>},
-    {kView, "&Details",            "Ctrl+2",       "Shows names with type, size, date and dimensions.", Needs::Nothing, ShowAs<choice::kViewDetails>, nullptr, false, Has<&BrowserModes::view, choice::kViewDetails>},
-    {kView, "&Small thumbnails",   "Ctrl+3",       "Shows small thumbnails.", Needs::Nothing, ShowAs<choice::kViewSmall>, nullptr, false, Has<&BrowserModes::view, choice::kViewSmall>},
-    {kView, "&Normal thumbnails",  "Ctrl+4",       "Shows thumbnails of 96 pixels.", Needs::Nothing, ShowAs<choice::kViewNormal>, nullptr, false, Has<&BrowserModes::view, choice::kViewNormal>},
-    {kView, "Lar&ge thumbnails",   "Ctrl+5",       "Shows thumbnails of 176 pixels.", Needs::Nothing, ShowAs<choice::kViewLarge>, nullptr, false, Has<&BrowserModes::view, choice::kViewLarge>},
-    {kView, "Lar&ger",             "Ctrl++",       "Shows larger thumbnails.", Needs::Nothing, Larger},
-    {kView, "S&maller",            "Ctrl+-",       "Shows smaller thumbnails.", Needs::Nothing, Smaller},
+    {kView, TrLater("&List"),               "Ctrl+1",       TrLater("Shows names only."), Needs::Nothing, ShowAs<choice::kViewList>, nullptr, false, Has<&BrowserModes::view, choice::kViewList>},
+    {kView, TrLater("&Details"),            "Ctrl+2",       TrLater("Shows names with type, size, date and dimensions."), Needs::Nothing, ShowAs<choice::kViewDetails>, nullptr, false, Has<&BrowserModes::view, choice::kViewDetails>},
+    {kView, TrLater("&Small thumbnails"),   "Ctrl+3",       TrLater("Shows small thumbnails."), Needs::Nothing, ShowAs<choice::kViewSmall>, nullptr, false, Has<&BrowserModes::view, choice::kViewSmall>},
+    {kView, TrLater("&Normal thumbnails"),  "Ctrl+4",       TrLater("Shows thumbnails of 96 pixels."), Needs::Nothing, ShowAs<choice::kViewNormal>, nullptr, false, Has<&BrowserModes::view, choice::kViewNormal>},
+    {kView, TrLater("Lar&ge thumbnails"),   "Ctrl+5",       TrLater("Shows thumbnails of 176 pixels."), Needs::Nothing, ShowAs<choice::kViewLarge>, nullptr, false, Has<&BrowserModes::view, choice::kViewLarge>},
+    {kView, TrLater("Lar&ger"),             "Ctrl++",       TrLater("Shows larger thumbnails."), Needs::Nothing, Larger},
+    {kView, TrLater("S&maller"),            "Ctrl+-",       TrLater("Shows smaller thumbnails."), Needs::Nothing, Smaller},
     {kView, nullptr},
-    {kView, "Sort by na&me",       "",             "Sorts by name; again, the other way round.", Needs::Nothing, SortBy<choice::kSortName>, nullptr, false, Has<&BrowserModes::sort, choice::kSortName>},
-    {kView, "Sort by &type",       "",             "Sorts by type; again, the other way round.", Needs::Nothing, SortBy<choice::kSortType>, nullptr, false, Has<&BrowserModes::sort, choice::kSortType>},
-    {kView, "Sort by si&ze",       "",             "Sorts by size; again, the other way round.", Needs::Nothing, SortBy<choice::kSortSize>, nullptr, false, Has<&BrowserModes::sort, choice::kSortSize>},
-    {kView, "Sort by d&ate",       "",             "Sorts by date; again, the other way round.", Needs::Nothing, SortBy<choice::kSortDate>, nullptr, false, Has<&BrowserModes::sort, choice::kSortDate>},
-    {kView, "Sort by E&XIF date",  "",             "Sorts by the date on which pictures were taken; again, the other way round.", Needs::Nothing, SortBy<choice::kSortExifDate>, nullptr, false, Has<&BrowserModes::sort, choice::kSortExifDate>},
-    {kView, "Sort by d&imensions", "",             "Sorts by the number of pixels; again, the other way round.", Needs::Nothing, SortBy<choice::kSortDimensions>, nullptr, false, Has<&BrowserModes::sort, choice::kSortDimensions>},
+    {kView, TrLater("Sort by na&me"),       "",             TrLater("Sorts by name; again reverses the order."), Needs::Nothing, SortBy<choice::kSortName>, nullptr, false, Has<&BrowserModes::sort, choice::kSortName>},
+    {kView, TrLater("Sort by &type"),       "",             TrLater("Sorts by type; again reverses the order."), Needs::Nothing, SortBy<choice::kSortType>, nullptr, false, Has<&BrowserModes::sort, choice::kSortType>},
+    {kView, TrLater("Sort by si&ze"),       "",             TrLater("Sorts by size; again reverses the order."), Needs::Nothing, SortBy<choice::kSortSize>, nullptr, false, Has<&BrowserModes::sort, choice::kSortSize>},
+    {kView, TrLater("Sort by d&ate"),       "",             TrLater("Sorts by date; again reverses the order."), Needs::Nothing, SortBy<choice::kSortDate>, nullptr, false, Has<&BrowserModes::sort, choice::kSortDate>},
+    {kView, TrLater("Sort by E&XIF date"),  "",             TrLater("Sorts by the date the pictures were taken; again reverses the order."), Needs::Nothing, SortBy<choice::kSortExifDate>, nullptr, false, Has<&BrowserModes::sort, choice::kSortExifDate>},
+    {kView, TrLater("Sort by d&imensions"), "",             TrLater("Sorts by the number of pixels; again reverses the order."), Needs::Nothing, SortBy<choice::kSortDimensions>, nullptr, false, Has<&BrowserModes::sort, choice::kSortDimensions>},
     {kView, nullptr},
-    {kView, "T&humbnails: disk-based", "",         "Thumbnails come from the files beside the pictures.", Needs::Nothing, ThumbnailsFrom<choice::kDiskBased>, nullptr, false, Has<&BrowserModes::thumbnails, choice::kDiskBased>},
-    {kView, "Thumbnails: &virtual", "",            "Thumbnails are kept in memory only.", Needs::Nothing, ThumbnailsFrom<choice::kVirtual>, nullptr, false, Has<&BrowserModes::thumbnails, choice::kVirtual>},
-    {kView, "Thumbnails: glo&bal database", "",    "Thumbnails come from the database in the data folder.", Needs::Nothing, ThumbnailsFrom<choice::kGlobalDatabase>, nullptr, false, Has<&BrowserModes::thumbnails, choice::kGlobalDatabase>},
-    {kView, "Thumbnails: lo&cal database", "",     "Thumbnails come from the database in the folder.", Needs::Nothing, ThumbnailsFrom<choice::kLocalDatabase>, nullptr, false, Has<&BrowserModes::thumbnails, choice::kLocalDatabase>},
+    {kView, TrLater("T&humbnails: disk-based"), "",         TrLater("Reads thumbnails from files beside the pictures."), Needs::Nothing, ThumbnailsFrom<choice::kDiskBased>, nullptr, false, Has<&BrowserModes::thumbnails, choice::kDiskBased>},
+    {kView, TrLater("Thumbnails: &virtual"), "",            TrLater("Keeps thumbnails in memory only."), Needs::Nothing, ThumbnailsFrom<choice::kVirtual>, nullptr, false, Has<&BrowserModes::thumbnails, choice::kVirtual>},
+    {kView, TrLater("Thumbnails: glo&bal database"), "",    TrLater("Reads thumbnails from the database in the data folder."), Needs::Nothing, ThumbnailsFrom<choice::kGlobalDatabase>, nullptr, false, Has<&BrowserModes::thumbnails, choice::kGlobalDatabase>},
+    {kView, TrLater("Thumbnails: lo&cal database"), "",     TrLater("Reads thumbnails from the database in the folder."), Needs::Nothing, ThumbnailsFrom<choice::kLocalDatabase>, nullptr, false, Has<&BrowserModes::thumbnails, choice::kLocalDatabase>},
     {kView, nullptr},
-    {kView, "Columns of the detai&ls...", "",      "Lets you choose the columns of the details.", Needs::Nothing, OfBrowser<&BrowserPage::ChooseColumns>},
-    {kView, "&Folders",            "F9",           "Shows or hides the folders at the left.", Needs::Nothing, ToggleFolders, nullptr, false, HasFolders},
-    {kView, "&Refresh",            "F5",           "Reads the folders again.", Needs::Nothing, ReadFoldersAgain},
+    {kView, TrLater("Detai&ls columns..."), "",      TrLater("Chooses the columns of the Details view."), Needs::Nothing, OfBrowser<&BrowserPage::ChooseColumns>},
+    {kView, TrLater("&Folders"),            "F9",           TrLater("Shows or hides the folder tree."), Needs::Nothing, ToggleFolders, nullptr, false, HasFolders},
+    {kView, TrLater("&Refresh"),            "F5",           TrLater("Reloads the folders."), Needs::Nothing, ReadFoldersAgain},
 
-    {kGo, "&Back",                 "Alt+Left",     "Goes to the folder before this one.", Needs::Nothing, OfBrowser<&BrowserPage::GoBack>},
-    {kGo, "&Forward",              "Alt+Right",    "Goes forward again.", Needs::Nothing, OfBrowser<&BrowserPage::GoForward>},
-    {kGo, "Folders gone t&hrough...", "Alt+Down",  "Offers the folders that this tab showed.", Needs::Nothing, OfBrowser<&BrowserPage::OfferTrail>},
-    {kGo, "&Parent folder",        "Alt+Up",       "Goes to the folder above this one.", Needs::Nothing, OfBrowser<&BrowserPage::GoUp>},
-    {kGo, "&Enter a folder",       "Ctrl+L",       "Lets you type a folder.", Needs::Nothing, OfBrowser<&BrowserPage::EditPath>},
-    {kGo, "F&avourite",            "Ctrl+D",       "Keeps this folder at the top of the folders at the left, or takes it away from there.", Needs::Nothing, ToggleFavourite, nullptr, false, IsFavourite},
+    {kGo, TrLater("&Back"),                 "Alt+Left",     TrLater("Goes back to the previous folder."), Needs::Nothing, OfBrowser<&BrowserPage::GoBack>},
+    {kGo, TrLater("&Forward"),              "Alt+Right",    TrLater("Goes forward to the next folder."), Needs::Nothing, OfBrowser<&BrowserPage::GoForward>},
+    {kGo, TrLater("Visited f&olders..."), "Alt+Down",  TrLater("Lists the folders that this tab has shown."), Needs::Nothing, OfBrowser<&BrowserPage::OfferTrail>},
+    {kGo, TrLater("&Parent folder"),        "Alt+Up",       TrLater("Goes to the parent folder."), Needs::Nothing, OfBrowser<&BrowserPage::GoUp>},
+    {kGo, TrLater("&Enter a folder"),       "Ctrl+L",       TrLater("Lets you type the path of a folder."), Needs::Nothing, OfBrowser<&BrowserPage::EditPath>},
+    {kGo, TrLater("F&avorite"),            "Ctrl+D",       TrLater("Adds this folder to the favorites at the top of the folder tree, or removes it."), Needs::Nothing, ToggleFavourite, nullptr, false, IsFavourite},
     {kGo, nullptr},
-    {kGo, "&Next tab",             "Ctrl+PageDown", "Goes to the next tab.", Needs::Nothing, NextTab, nullptr, false, nullptr, "Ctrl+Tab"},
-    {kGo, "Pre&vious tab",         "Ctrl+PageUp",  "Goes to the previous tab.", Needs::Nothing, PreviousTab, nullptr, false, nullptr, "Ctrl+Shift+Tab"},
+    {kGo, TrLater("&Next tab"),             "Ctrl+PageDown", TrLater("Switches to the next tab."), Needs::Nothing, NextTab, nullptr, false, nullptr, "Ctrl+Tab"},
+    {kGo, TrLater("Pre&vious tab"),         "Ctrl+PageUp",  TrLater("Switches to the previous tab."), Needs::Nothing, PreviousTab, nullptr, false, nullptr, "Ctrl+Shift+Tab"},
 
-    {kFunctions, "&View",          "Ctrl+Return",  "Shows the focused picture in a view window.", Needs::Files, View, "view", true},
-    {kFunctions, "Com&pare",       "Ctrl+Shift+Return", "Shows two to four selected pictures beside each other.", Needs::Few, CompareSelection, nullptr, true},
-    {kFunctions, "&Convert...",    "Ctrl+E",       "Writes the selected pictures in another format.", Needs::Files, ConvertSelection, "convert", true},
-    {kFunctions, "Rotate &left",   "Ctrl+Alt+L",   "Rotates the selected pictures in their files; JPEG loses nothing.", Needs::Files, Turn<Orientation::QuarterLeft>, nullptr, true},
-    {kFunctions, "Rotate r&ight",  "Ctrl+Alt+R",   "Rotates the selected pictures in their files; JPEG loses nothing.", Needs::Files, Turn<Orientation::QuarterRight>, nullptr, true},
-    {kFunctions, "&Get info...",   "Alt+Return",   "Tells what the selected files hold.", Needs::Files, ShowInfo, "info", true},
-    {kFunctions, "E&XIF...",       "Alt+Shift+Return", "Shows what the camera wrote into the focused picture.", Needs::Files, ShowExif, "exif", true},
+    {kFunctions, TrLater("&View"),          "Ctrl+Return",  TrLater("Shows the focused picture in a view window."), Needs::Files, View, "view", true},
+    {kFunctions, TrLater("Com&pare"),       "Ctrl+Shift+Return", TrLater("Shows two to four selected pictures side by side."), Needs::Few, CompareSelection, nullptr, true},
+    {kFunctions, TrLater("&Convert..."),    "Ctrl+E",       TrLater("Converts the selected pictures to another format."), Needs::Files, ConvertSelection, "convert", true},
+    {kFunctions, TrLater("Rotate &left"),   "Ctrl+Alt+L",   TrLater("Rotates the selected files; JPEG losslessly."), Needs::Files, Turn<Orientation::QuarterLeft>, nullptr, true},
+    {kFunctions, TrLater("Rotate r&ight"),  "Ctrl+Alt+R",   TrLater("Rotates the selected files; JPEG losslessly."), Needs::Files, Turn<Orientation::QuarterRight>, nullptr, true},
+    {kFunctions, TrLater("&Get info..."),   "Alt+Return",   TrLater("Shows information about the selected files."), Needs::Files, ShowInfo, "info", true},
+    {kFunctions, TrLater("E&XIF..."),       "Alt+Shift+Return", TrLater("Shows the EXIF data of the focused picture."), Needs::Files, ShowExif, "exif", true},
     {kFunctions, nullptr},
-    {kFunctions, "C&opy to...",    "F7",           "Copies the selected files to a folder.", Needs::Item, CopySelectionTo, "copy", true},
-    {kFunctions, "&Move to...",    "F6",           "Moves the selected files to a folder.", Needs::Item, MoveSelectionTo, "move", true},
-    {kFunctions, "&Rename...",     "Shift+F2",     "Numbers the selected files.", Needs::Files, RenameSelectionSequentially, "rename"},
-    {kFunctions, "&Delete",        "Delete",       "Moves the selected files to the trash.", Needs::Item, TrashSelection, "trash", true},
-    {kFunctions, "Delete for &good...", "Shift+Delete", "Deletes the selected files; this cannot be undone.", Needs::Item, DeleteSelection},
+    {kFunctions, TrLater("C&opy to..."),    "F7",           TrLater("Copies the selected files to a folder."), Needs::Item, CopySelectionTo, "copy", true},
+    {kFunctions, TrLater("&Move to..."),    "F6",           TrLater("Moves the selected files to a folder."), Needs::Item, MoveSelectionTo, "move", true},
+    {kFunctions, TrLater("&Rename..."),     "Shift+F2",     TrLater("Renames the selected files in sequence."), Needs::Files, RenameSelectionSequentially, "rename"},
+    {kFunctions, TrLater("&Delete"),        "Delete",       TrLater("Moves the selected files to the trash."), Needs::Item, TrashSelection, "trash", true},
+    {kFunctions, TrLater("Delete perma&nently..."), "Shift+Delete", TrLater("Deletes the selected files; this cannot be undone."), Needs::Item, DeleteSelection},
 
-    {kTools, "File &history...",     "Ctrl+H",       "Lists the files used last and what for.", Needs::Nothing, ShowFileHistory, "history"},
-    {kTools, "&Compact database...", "",             "Takes deleted thumbnails out of a thumbnail database.", Needs::Nothing, ShowCompaction},
-    {kTools, "Clean up &thumbnails...", "",          "Deletes thumbnail files whose pictures are gone.", Needs::Nothing, ShowCleanUp},
-    {kTools, "&Plug-ins...",         "",             "Lists the plug-in formats and opens their settings.", Needs::Nothing, ShowPlugins},
-    {kTools, "Tool&bar...",          "",             "Chooses the buttons of the toolbar and their order.", Needs::Nothing, ChooseToolbar},
+    {kTools, TrLater("File &history..."),     "Ctrl+H",       TrLater("Lists recently used files."), Needs::Nothing, ShowFileHistory, "history"},
+    {kTools, TrLater("&Compact database..."), "",             TrLater("Removes deleted records from a thumbnail database."), Needs::Nothing, ShowCompaction},
+    {kTools, TrLater("Clean up &thumbnails..."), "",          TrLater("Deletes thumbnail files without a picture."), Needs::Nothing, ShowCleanUp},
+    {kTools, TrLater("&Plug-ins..."),         "",             TrLater("Lists the plug-in formats and opens their settings."), Needs::Nothing, ShowPlugins},
+    {kTools, TrLater("Tool&bar..."),          "",             TrLater("Chooses the toolbar buttons and their order."), Needs::Nothing, ChooseToolbar},
     {kTools, nullptr},
-    {kTools, "&Setup...",            "Ctrl+,",       "Shows all settings.", Needs::Nothing, ShowSetup, "setup"},
+    {kTools, TrLater("&Setup..."),            "Ctrl+,",       TrLater("Shows all settings."), Needs::Nothing, ShowSetup, "setup"},
 
-    {kHelp, "&Find command...",      "Ctrl+K",       "Finds a command by words of its name.", Needs::Nothing, FindCommand},
-    {kHelp, "&Manual",               "F1",           "Tells what the windows can do, and with which keys.", Needs::Nothing, ShowManual},
-    {kHelp, "&Configuration",        "",             "Tells how settings are kept.", Needs::Nothing, ShowConfigurationHelp},
+    {kHelp, TrLater("&Find command..."),      "Ctrl+K",       TrLater("Finds a command by name."), Needs::Nothing, FindCommand},
+    {kHelp, TrLater("&Manual"),               "F1",           TrLater("Describes the windows and their keyboard shortcuts."), Needs::Nothing, ShowManual},
+    {kHelp, TrLater("&Configuration"),        "",             TrLater("Describes how settings are stored."), Needs::Nothing, ShowConfigurationHelp},
 };
 // clang-format on
 
@@ -234,12 +235,12 @@ bool CanRun(const Command& command, Shell& shell) {
 
 const char* WhyNot(Needs needs) {
   switch (needs) {
-    case Needs::Files: return "No picture is selected.";
-    case Needs::Few: return "Two to four pictures have to be selected.";
-    case Needs::Item: return "No file or folder is selected.";
-    case Needs::Undo: return "There is nothing to take back.";
-    case Needs::Redo: return "There is nothing to do again.";
-    case Needs::ClosedTab: return "No tab was closed.";
+    case Needs::Files: return TrLater("No picture is selected.");
+    case Needs::Few: return TrLater("Select two to four pictures.");
+    case Needs::Item: return TrLater("No file or folder is selected.");
+    case Needs::Undo: return TrLater("There is nothing to undo.");
+    case Needs::Redo: return TrLater("There is nothing to redo.");
+    case Needs::ClosedTab: return TrLater("There is no closed tab.");
     case Needs::Nothing: break;
   }
   return "";

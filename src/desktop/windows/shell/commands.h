@@ -23,7 +23,7 @@ enum class Needs {
 // One function of the frame: a menu item, perhaps a button, its keys, and what it does. A new window is one row in
 // commands.cpp. Menus and toolbar are in the order of the rows; a row without text draws a line in its menu.
 struct Command {
-  const char* menu;              // "&File"
+  const char* menu;              // "&File"; these texts are in English
   const char* text;              // with mnemonic; null for a separator
   const char* accelerator = "";  // as wxWidgets writes them, empty for none
   const char* help = "";         // one sentence for the status bar

@@ -12,6 +12,7 @@
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/shell.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -80,7 +81,7 @@ void FolderPane::FollowRename(const std::string& from, const std::string& to) {
 
 void FolderPane::ToggleFavourite(const std::string& folder) {
   const bool written = favourites_.Has(folder) ? favourites_.Remove(folder) : favourites_.Add(folder);
-  if (!written) shell_.Report("The list of favourites could not be changed.");
+  if (!written) shell_.Report(Tr("The list of favorites could not be saved."));
   tree_->UpdatePlaces();
   LogEvent("favourites", std::to_string(favourites_.Folders().size()));
 }

@@ -17,7 +17,7 @@ class FolderPane {
  public:
   explicit FolderPane(Shell& shell);
 
-  // The parent of what stands beside the folders.
+  // The parent of what is beside the folders.
   wxWindow* Parent() const;
   void PlaceBeside(wxWindow& other);
   void Show(bool show);

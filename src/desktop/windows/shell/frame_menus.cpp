@@ -21,7 +21,7 @@ namespace {
 // With its key, as menus show it and take it.
 wxString MenuText(const Command& command) {
   const wxString keys = *command.accelerator == '\0' ? wxString() : wxString("\t") + command.accelerator;
-  return command.text + keys;
+  return Label(command.text) + keys;
 }
 
 }  // namespace
@@ -37,12 +37,12 @@ void FrameMenus::BuildBar() {
   std::map<std::string, wxMenu*> menus;
   for (const Command& command : Commands()) {
     wxMenu*& menu = menus[command.menu];
-    if (menu == nullptr) bar->Append(menu = new wxMenu, command.menu);
+    if (menu == nullptr) bar->Append(menu = new wxMenu, Label(command.menu));
     if (command.text == nullptr) {
       menu->AppendSeparator();
       continue;
     }
-    menu->Append(CommandId(command), MenuText(command), command.help, command.checked != nullptr ? wxITEM_CHECK : wxITEM_NORMAL);
+    menu->Append(CommandId(command), MenuText(command), Label(command.help), command.checked != nullptr ? wxITEM_CHECK : wxITEM_NORMAL);
   }
   shell_.Window().SetMenuBar(bar);
 }
@@ -76,7 +76,8 @@ void FrameMenus::Update(wxUpdateUIEvent& event) {
   if (command.needs != Needs::Undo && command.needs != Needs::Redo) return;
   const UndoList& undo = shell_.Files().Undoable();
   const std::string name = command.needs == Needs::Undo ? undo.UndoName() : undo.RedoName();
-  const wxString text = command.text + (name.empty() ? wxString() : " " + Shown(name)) + "\t" + command.accelerator;
+  const wxString verb = Label(command.text);
+  const wxString text = (name.empty() ? verb : Label("%1 %2", verb, Shown(name))) + "\t" + command.accelerator;
   wxMenuBar* const bar = shell_.Window().GetMenuBar();
   if (event.GetEventObject() == bar || bar->FindItem(event.GetId())->GetItemLabel() != text) {
     bar->FindItem(event.GetId())->SetItemLabel(text);
@@ -87,11 +88,11 @@ void FrameMenus::ShowContextMenu(wxWindow& window, const wxPoint& place) {
   wxMenu menu;
   for (const Command& command : Commands()) {
     if (command.text == nullptr || !command.inContextMenu) continue;
-    menu.Append(CommandId(command), MenuText(command), command.help);
+    menu.Append(CommandId(command), MenuText(command), Label(command.help));
   }
   if (wxMenu* programs = NewOpenWithMenu(shell_, shell_.Tabs().SelectedFiles())) {
     menu.AppendSeparator();
-    menu.AppendSubMenu(programs, "Open &with");
+    menu.AppendSubMenu(programs, Label("Open &with"));
   }
   window.PopupMenu(&menu, place);
 }

@@ -11,8 +11,10 @@
 #include "desktop/windows/dialogs/tab_set_box.h"
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/shell.h"
+#include "desktop/windows/widgets/wx_text.h"
 #include "settings/configuration.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -62,7 +64,7 @@ void FrameSession::SaveTabSet() {
   const SettingText before = std::exchange(settings.TabsetCurrentName, SettingText(TabSetFile(*name)));
   if (!Keep(true)) {
     settings.TabsetCurrentName = before;
-    wxMessageBox("The tab set could not be written.", "Fotomill Professional", wxOK | wxICON_WARNING, &shell_.Window());
+    wxMessageBox(Label("The tab set could not be written."), "Fotomill Professional", wxOK | wxICON_WARNING, &shell_.Window());
     return;
   }
   (void)SaveConfiguration();
@@ -73,12 +75,12 @@ void FrameSession::SaveTabSet() {
 void FrameSession::OpenTabSet() {
   const auto name = ChooseTabSet(shell_.Window());
   if (!name || *name == CurrentTabSet()) return;
-  if (!Keep(true)) return shell_.Report("The tabs that are open could not be kept, so they stay.");
+  if (!Keep(true)) return shell_.Report(Tr("The open tabs could not be saved, so they were left open."));
   const SettingText before = std::exchange(settings.TabsetCurrentName, SettingText(TabSetFile(*name)));
   const Session session = LoadSession();
   if (session.tabs.empty()) {
     settings.TabsetCurrentName = before;
-    return shell_.Report("The folders of this tab set are not there any more.");
+    return shell_.Report(Tr("The folders of this tab set no longer exist."));
   }
   lastTabs_ = {};
   shell_.Tabs().Replace(session);

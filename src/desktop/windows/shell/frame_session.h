@@ -13,7 +13,7 @@ class FrameSession {
 
   // Gives the frame the size and place of the last run; its tabs are opened later.
   void RestorePlace();
-  // Opens the tabs of the last run, where they are to be remembered. False when there are none.
+  // Opens the tabs of the last run, where they are to be remembered. False if there are none.
   bool RestoreTabs();
   // Writes the tabs, or none, and the frame's size to the set in use. False when that could not be done.
   [[nodiscard]] bool Keep(bool withTabs);

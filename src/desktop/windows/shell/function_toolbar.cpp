@@ -10,6 +10,7 @@
 #include "desktop/windows/shell/commands.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/bitmaps.h"
+#include "desktop/windows/widgets/wx_text.h"
 
 namespace fotomill::desktop {
 
@@ -36,9 +37,9 @@ void FunctionToolbar::Fill() {
   for (const ToolbarButton& button : ToolbarButtons()) {
     if (!button.shown) continue;
     const Command& command = *CommandOfSymbol(button.name);
-    wxString label = wxControl::RemoveMnemonics(command.text);
+    wxString label = wxControl::RemoveMnemonics(Label(command.text));
     label.EndsWith("...", &label);
-    bar_->AddTool(CommandId(command), label, Symbol(command.symbol, 20), command.help);
+    bar_->AddTool(CommandId(command), label, Symbol(command.symbol, 20), Label(command.help));
     names += " " + button.name;
   }
   bar_->Realize();
@@ -52,7 +53,8 @@ void FunctionToolbar::Choose() {
 // The tip of a button that is gray says why.
 void FunctionToolbar::ShowTip(const Command& command) {
   const wxString key = *command.accelerator == '\0' ? wxString() : wxString(" (") + command.accelerator + ")";
-  const wxString tip = command.help + key + (CanRun(command, shell_) ? wxString() : wxString("\n") + WhyNot(command.needs));
+  const wxString why = CanRun(command, shell_) ? wxString() : wxString("\n") + Label(WhyNot(command.needs));
+  const wxString tip = Label(command.help) + key + why;
   if (bar_->GetToolShortHelp(CommandId(command)) != tip) bar_->SetToolShortHelp(CommandId(command), tip);
 }
 

@@ -106,8 +106,8 @@ void MainFrame::Report(const std::string& text) { SetStatusText(Shown(text), kMe
 
 void MainFrame::OnClose(wxCloseEvent& event) {
   if (batches_->Running() && event.CanVeto()) {
-    wxMessageDialog dialog(this, "A batch is running. Stop it and quit?", kTitle, wxOK | wxCANCEL | wxICON_WARNING);
-    dialog.SetOKCancelLabels("&Stop and quit", "&Go on");
+    wxMessageDialog dialog(this, Label("A batch is running. Stop it and quit?"), kTitle, wxOK | wxCANCEL | wxICON_WARNING);
+    dialog.SetOKCancelLabels(Label("&Stop and quit"), Label("&Continue"));
     if (dialog.ShowModal() != wxID_OK) return event.Veto();
   }
   folders_->KeepWidth();

@@ -37,7 +37,7 @@ class Shell {
 
   // Files were written, renamed or deleted: every window looks again.
   virtual void FilesChanged() = 0;
-  // A file or folder may have got another name: what shows it, or lies in it, goes on under that one.
+  // A file or folder may have got another name: what shows it, or is in it, continues under that one.
   virtual void FollowRename(const std::string& from, const std::string& to) = 0;
   // Settings have changed: every window shows what they say now.
   virtual void SettingsChanged() = 0;

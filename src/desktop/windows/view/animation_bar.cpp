@@ -6,6 +6,7 @@
 
 #include "desktop/windows/widgets/bitmaps.h"
 #include "desktop/windows/widgets/screen_reader.h"
+#include "desktop/windows/widgets/wx_text.h"
 #include "settings/settings.h"
 
 namespace fotomill::desktop {
@@ -19,13 +20,13 @@ constexpr int kLineHeight = 4;
 AnimationBar::AnimationBar(wxWindow* parent, Events events) : wxPanel(parent) {
   auto* column = new wxBoxSizer(wxVERTICAL);
   line_ = new wxGauge(this, wxID_ANY, 1, wxDefaultPosition, FromDIP(wxSize(-1, kLineHeight)), wxGA_HORIZONTAL | wxGA_SMOOTH,
-                      wxDefaultValidator, "Frame");
+                      wxDefaultValidator, Label("Frame"));
   buttons_ = new wxPanel(this);
   auto* row = new wxBoxSizer(wxHORIZONTAL);
   row->AddStretchSpacer();
-  AddButton(*row, "previous", "Previous frame (,)", [step = events.step] { step(-1); });
-  toggle_ = AddButton(*row, "play", "Play (Space)", events.toggle);
-  AddButton(*row, "next", "Next frame (.)", [step = events.step] { step(1); });
+  AddButton(*row, "previous", Label("Previous frame (,)"), [step = events.step] { step(-1); });
+  toggle_ = AddButton(*row, "play", Label("Play (Space)"), events.toggle);
+  AddButton(*row, "next", Label("Next frame (.)"), [step = events.step] { step(1); });
   row->AddStretchSpacer();
   buttons_->SetSizer(row);
   column->Add(line_, wxSizerFlags().Expand());
@@ -56,7 +57,7 @@ void AnimationBar::Report(bool playing, size_t frame, size_t count) {
   if (playing == playing_) return;
   playing_ = playing;
   toggle_->SetBitmap(Symbol(playing ? "pause" : "play"));
-  const wxString name = playing ? "Pause (Space)" : "Play (Space)";
+  const wxString name = playing ? Label("Pause (Space)") : Label("Play (Space)");
   toggle_->SetToolTip(name);
   ReportToScreenReader(*toggle_, name);
 }

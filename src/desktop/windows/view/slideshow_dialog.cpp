@@ -9,29 +9,30 @@
 #include <wx/stattext.h>
 
 #include "desktop/models/shell/event_log.h"
+#include "desktop/windows/widgets/wx_text.h"
 
 namespace fotomill::desktop {
 
 std::optional<SlideshowChoices> AskForSlideshow(wxWindow& parent, const SlideshowChoices& choices) {
-  wxDialog dialog(&parent, wxID_ANY, "Slideshow", wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE, "SlideshowBox");
+  wxDialog dialog(&parent, wxID_ANY, Label("Slideshow"), wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE, "SlideshowBox");
   const int gap = dialog.FromDIP(10);
   auto* grid = new wxFlexGridSizer(2, gap, gap);
-  const auto label = [&](const char* text) {
+  const auto label = [&](const wxString& text) {
     grid->Add(new wxStaticText(&dialog, wxID_ANY, text), wxSizerFlags().CenterVertical());
   };
-  label("&Seconds that a picture stays:");
+  label(Label("&Seconds per picture:"));
   auto* seconds = new wxSpinCtrl(&dialog, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxSP_ARROW_KEYS, 1,
                                  SlideshowChoices::kMostSeconds, choices.seconds);
   grid->Add(seconds);
-  label("&Order:");
-  const wxString orders[] = {"as in the list", "random"};
+  label(Label("&Order:"));
+  const wxString orders[] = {Label("as listed"), Label("random")};
   auto* order = new wxChoice(&dialog, wxID_ANY, wxDefaultPosition, wxDefaultSize, static_cast<int>(std::size(orders)), orders);
   order->SetSelection(choices.random ? 1 : 0);
   grid->Add(order);
-  auto* repeat = new wxCheckBox(&dialog, wxID_ANY, "&Begin again after the last picture");
+  auto* repeat = new wxCheckBox(&dialog, wxID_ANY, Label("&Repeat from the start"));
   repeat->SetValue(choices.repeat);
   auto* buttons = new wxBoxSizer(wxHORIZONTAL);
-  auto* start = new wxButton(&dialog, wxID_OK, "S&tart");
+  auto* start = new wxButton(&dialog, wxID_OK, Label("S&tart"));
   buttons->AddStretchSpacer();
   buttons->Add(new wxButton(&dialog, wxID_CANCEL), wxSizerFlags().Border(wxRIGHT, gap));
   buttons->Add(start);

@@ -10,6 +10,7 @@
 #include "desktop/windows/view/system_animations.h"
 #include "platform/clock.h"
 #include "registry/registry.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -116,9 +117,9 @@ void ViewAnimation::ShowAgain() {
 std::string ViewAnimation::StatusText() const {
   if (!Active()) return {};
   std::string text = "animation";
-  if (player_->Count() > 0) text = "frame " + std::to_string(player_->Frame() + 1) + " of " + std::to_string(player_->Count());
-  if (player_->Count() > 0 && !player_->Playing()) text += ", paused";
-  if (player_->Failure() != Status::Ok) text += ", " + std::string(StatusMessage(player_->Failure()));
+  if (player_->Count() > 0) text = Tr("frame %1 of %2", player_->Frame() + 1, player_->Count());
+  if (player_->Count() > 0 && !player_->Playing()) text += std::string(", ") + Tr("paused");
+  if (player_->Failure() != Status::Ok) text += ", " + Tr(StatusMessage(player_->Failure()));
   return text;
 }
 

@@ -15,6 +15,7 @@
 #include "platform/paths.h"
 #include "processing/geometry/scale.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -34,7 +35,7 @@ wxColour ColorOf(int32_t color) {
 
 ViewCanvas::ViewCanvas(wxWindow* parent, Events events) : events_(std::move(events)) {
   SetBackgroundStyle(wxBG_STYLE_PAINT);
-  Create(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxWANTS_CHARS | wxBORDER_NONE, "Picture");
+  Create(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxWANTS_CHARS | wxBORDER_NONE, Label("Picture"));
   scaler_ = std::make_unique<ViewScaler>([this] { CallAfter([this] { ScaledCame(); }); });
   transform_.SetModeFromKey(settings.DefaultViewZoom);
   Bind(wxEVT_PAINT, &ViewCanvas::OnPaint, this);
@@ -213,7 +214,7 @@ void ViewCanvas::PaintMessage(wxDC& dc) const {
   const Shade text = Readable({0, 0, 0}, {around.Red(), around.Green(), around.Blue()});
   dc.SetTextForeground(wxColour(text.red, text.green, text.blue));
   const std::string name(platform::FileNameOf(picture_->wish.path));
-  dc.DrawLabel(Shown(name) + "\n" + Shown(StatusMessage(picture_->status)), wxRect(GetClientSize()), wxALIGN_CENTER);
+  dc.DrawLabel(Shown(name) + "\n" + Shown(Tr(StatusMessage(picture_->status))), wxRect(GetClientSize()), wxALIGN_CENTER);
 }
 
 void ViewCanvas::PaintOverlay(wxDC& dc) const {

@@ -47,7 +47,7 @@ class ViewCanvas : public wxWindow {
   void ZoomOut() { ZoomBy(1 / ViewTransform::kStep); }
   void ZoomActual();
   void SetZoom(ZoomMode mode);
-  // Pixels of the screen a pixel of the picture, and whether more of it lies outside the window.
+  // Pixels of the screen a pixel of the picture, and whether more of it is outside the window.
   double Zoom() const { return transform_.Scale(); }
   bool CanPan() const { return transform_.CanPan(); }
   // By eighths of the window.

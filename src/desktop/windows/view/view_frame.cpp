@@ -24,6 +24,7 @@
 #include "platform/paths.h"
 #include "settings/configuration.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -35,7 +36,7 @@ constexpr int kPointerMs = 2000;
 }  // namespace
 
 ViewFrame::ViewFrame(Shell& shell, const std::vector<std::string>& list, const std::string& file)
-    : wxFrame(&shell.Window(), wxID_ANY, "View", wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE,
+    : wxFrame(&shell.Window(), wxID_ANY, Label("View"), wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE,
               "FotomillProfessionalView"),
       shell_(shell),
       list_(list),
@@ -254,17 +255,17 @@ void ViewFrame::LogPaint() {
 }
 
 std::string ViewFrame::StatusLine() const {
-  std::string line = std::to_string(place_ + 1) + " of " + WithThousands(list_.size());
+  std::string line = Tr("%1 of %2", place_ + 1, ThousandsText(list_.size()));
   const ViewPicturePointer& shown = canvas_->Picture();
-  if (!IsCurrent(shown)) return line + ", loading...";
-  if (shown->picture == nullptr) return line + ", " + std::string(StatusMessage(shown->status));
+  if (!IsCurrent(shown)) return line + ", " + Tr("loading...");
+  if (shown->picture == nullptr) return line + ", " + Tr(StatusMessage(shown->status));
   const PictureRecord& picture = *shown->picture;
   line += ", " + SizeAndZoom(picture, canvas_->Zoom());
-  if (turn_ != Orientation::Upright) line += ", turned, not saved";
+  if (turn_ != Orientation::Upright) line += std::string(", ") + Tr("rotated, not saved");
   if (animation_->Active()) {
     line += ", " + animation_->StatusText();
   } else if (picture.pageCount > 1) {
-    line += ", page " + std::to_string(page_ + 1) + " of " + std::to_string(picture.pageCount);
+    line += ", " + Tr("page %1 of %2", page_ + 1, picture.pageCount);
   }
   if (!note_.empty()) line += ". " + note_;
   return line;
@@ -282,7 +283,7 @@ void ViewFrame::ViewChanged() {
   if (canvas_ == nullptr || GetStatusBar() == nullptr) return;  // still being made
   const std::string line = StatusLine();
   const wxString name = Shown(platform::FileNameOf(list_[place_]));
-  const wxString title = name + (turn_ == Orientation::Upright ? "" : " (turned, not saved)") + " - View";
+  const wxString title = turn_ == Orientation::Upright ? Label("%1 - View", name) : Label("%1 (rotated, not saved) - View", name);
   if (title != GetTitle()) SetTitle(title);
   SetStatusText(Shown(line));
   // A number that changes many times a second is nothing to listen to.
@@ -368,7 +369,7 @@ void ViewFrame::Turn(Orientation turn) {
 }
 
 void ViewFrame::SaveTurned() {
-  if (saving_ || turn_ == Orientation::Upright) return SetStatusText("The picture is as its file has it.");
+  if (saving_ || turn_ == Orientation::Upright) return SetStatusText(Label("The picture is unchanged."));
   const std::string path = list_[place_];
   const wxWeakRef<ViewFrame> self(this);
   saving_ = shell_.Files().SaveTurned(path, turn_, [self, path](bool done, const std::string& note) {
@@ -378,7 +379,7 @@ void ViewFrame::SaveTurned() {
     if (self->list_[self->place_] == path) self->note_ = note;
     self->ViewChanged();
   });
-  SetStatusText(saving_ ? "Saving..." : "Wait until the files before are done.");
+  SetStatusText(saving_ ? Label("Saving...") : Label("Please wait for the previous file operation."));
 }
 
 void ViewFrame::FilesChanged() {
@@ -404,7 +405,7 @@ void ViewFrame::CopyPicture() {
   if (PixelsForOthers(*shown, static_cast<Color>(settings.ViewModeBackground), pixels) != Status::Ok) return wxBell();
   const wxClipboardLocker clipboard;
   if (!clipboard || !wxTheClipboard->SetData(new wxBitmapDataObject(BitmapOf(pixels)))) return wxBell();
-  SetStatusText("The picture is on the clipboard.");
+  SetStatusText(Label("The picture was copied to the clipboard."));
 }
 
 // --- keys ---

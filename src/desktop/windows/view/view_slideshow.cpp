@@ -6,6 +6,7 @@
 
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/view/slideshow_dialog.h"
+#include "desktop/windows/widgets/wx_text.h"
 
 namespace fotomill::desktop {
 
@@ -61,7 +62,7 @@ bool ViewSlideshow::Choose(wxWindow& parent) {
   unkept_.reset();
   if (!SaveSlideshowChoices(*chosen)) {
     unkept_ = chosen;
-    wxMessageBox("The choices could not be kept for the next time.", "Slideshow", wxOK | wxICON_WARNING, &parent);
+    wxMessageBox(Label("The slideshow settings could not be saved."), Label("Slideshow"), wxOK | wxICON_WARNING, &parent);
   }
   return true;
 }

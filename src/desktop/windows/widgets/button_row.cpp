@@ -2,6 +2,8 @@
 
 #include <wx/button.h>
 
+#include "desktop/windows/widgets/wx_text.h"
+
 namespace fotomill::desktop {
 
 wxSizer* BuildButtonRow(wxFrame& frame, wxWindow& panel, std::span<const RowButton> rows) {
@@ -9,7 +11,7 @@ wxSizer* BuildButtonRow(wxFrame& frame, wxWindow& panel, std::span<const RowButt
   for (const RowButton& row : rows) {
     const bool closes = row.id == wxID_CLOSE;
     if (closes) buttons->AddStretchSpacer();
-    auto* button = new wxButton(&panel, row.id, row.label);
+    auto* button = new wxButton(&panel, row.id, Label(row.label));
     buttons->Add(button, wxSizerFlags().Border(wxRIGHT, closes ? 0 : frame.FromDIP(6)));
     const auto run = [button, action = row.run](wxCommandEvent&) {
       if (button->IsEnabled()) action();

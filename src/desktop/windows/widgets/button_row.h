@@ -11,7 +11,7 @@ namespace fotomill::desktop {
 // A button of the row; wxID_CLOSE is the one apart.
 struct RowButton {
   wxWindowID id;
-  const char* label;
+  const char* label;  // in English
   std::function<void()> run;
 };
 

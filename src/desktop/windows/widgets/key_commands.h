@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <span>
 
+#include "desktop/windows/widgets/wx_text.h"
 #include "settings/settings.h"
 
 namespace fotomill::desktop {
@@ -43,7 +44,7 @@ void ShowCommandMenu(std::span<const KeyCommand<Window>> commands, Window& windo
       continue;
     }
     // The key is shown beside the text only: keys are the window's own.
-    const wxString text = wxString(command.text) + "    " + command.shownKey;
+    const wxString text = Label(command.text) + "    " + command.shownKey;
     if (command.checked == nullptr) {
       menu.Append(++id, text);
     } else {
