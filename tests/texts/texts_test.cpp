@@ -7,6 +7,7 @@
 #include "core/limits.h"
 #include "platform/files.h"
 #include "registry/registry.h"
+#include "support/files.h"
 
 namespace fotomill {
 namespace {
@@ -36,7 +37,7 @@ TEST(Texts, CharactersAreNotBytes) { EXPECT_EQ(CharacterCount("Größe"), 5u); }
 // Texts of tables are translated where they are shown; xgettext finds them only if the table marks them with TrLater.
 TEST(Texts, TablesAreMarkedForTranslation) {
   std::string pot;
-  ASSERT_EQ(platform::ReadWholeFile(FOTOMILL_SOURCE_DIR "/po/fotomill.pot", limits.listFileBytes, pot), platform::ReadResult::Done);
+  ASSERT_EQ(platform::ReadWholeFile(test::SourcePath("po/fotomill.pot"), limits.listFileBytes, pot), platform::ReadResult::Done);
   const auto expect = [&](std::string_view text) {
     const std::string entry = "\nmsgid \"" + std::string(text) + "\"\n";
     EXPECT_NE(pot.find(entry), std::string::npos) << "mark it with TrLater and run po/update: " << text;
