@@ -142,7 +142,7 @@ TEST_F(Run, AVariantMayBeTooLongWhereItsNameWasNot) {
   job.applyToRest = true;  // keep both
   ASSERT_EQ(RunBatch({&file, 1}, {}, job), Status::Ok);
   EXPECT_EQ(job.progress.Lines()[0].item.status, Status::InvalidDestination);
-  EXPECT_THAT(job.progress.Lines()[0].text, testing::EndsWith(" Its path would be longer than 260 characters."));
+  EXPECT_THAT(job.progress.Lines()[0].text, testing::EndsWith(" The path would be longer than 260 characters."));
   EXPECT_EQ(Outputs().size(), 1u);
 }
 

@@ -293,7 +293,7 @@ TEST_F(ThumbsCommand, ShowsAThumbnailAsAPicture) {
   EXPECT_EQ(RunCommand({"thumbs", "show", In("a.THN"), "--out", In("t.bmp")}).status, 1);
   EXPECT_EQ(RunCommand({"thumbs", "show", In("a.THN"), "--out", In("t.bmp"), "--overwrite", "replace"}).status, 0);
   EXPECT_TRUE(RunCommand({"thumbs", "show", In("a.bmp"), "--out", In("u.bmp")})
-                  .Says(In("a.bmp") + ": Damaged file. It is no thumbnail file."));
+                  .Says(In("a.bmp") + ": Damaged file. Not a thumbnail file."));
   EXPECT_TRUE(RunCommand({"thumbs", "show", In("x.THN"), "--out", In("u.bmp")}).Says(In("x.THN") + ": File open error."));
 }
 
