@@ -208,7 +208,7 @@ class Batch {
   Status Load(const std::string& name, PicturePointer& picture) const {
     ReadRequest request{.fileName = name, .options = job_.read};
     RETURN_IF_BAD(LoadPictureInfo(request, picture));
-    request.page = function_.page - 1;
+    request.page = picture->page = function_.page - 1;
     if (IsOnlyPlanned()) return function_.page > picture->pageCount ? Status::NoImages : Status::Ok;
     RETURN_IF_BAD(ReadPicture(request, *picture));
     return function_.autoOrient ? TurnUpright(*picture) : Status::Ok;

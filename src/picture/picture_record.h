@@ -83,6 +83,7 @@ struct PictureRecord {
   std::vector<uint8_t> comment;        // the file's comment text, UTF-8
   FixedText<80> warning;               // a fault in the file that the decoder passed over; empty when there was none
   int32_t pageCount = 1;               // pages or frames in the file
+  int32_t page = 0;                    // which of them this is, from 0
   bool simplified = false;             // by `info`: the file holds what a new one would not, deeper samples or further inks
   int32_t hotSpotX = 0, hotSpotY = 0;  // of a cursor, pixels from the left and the top
   int32_t reduction = 1;               // of a picture decoded smaller than it is: how many pixels along each edge one of `image`

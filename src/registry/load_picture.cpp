@@ -33,6 +33,7 @@ Status ReadPicture(const ReadRequest& request, PictureRecord& picture) {
   if (request.page < 0 || request.page >= picture.pageCount) return Status::NoImages;
   const FormatEntry& row = FormatRow(picture.formatIndex);
   if (row.read == nullptr || (row.flags & FMT_RENDERED) != 0) return Status::Ok;
+  picture.page = request.page;
   picture.progress = request.progress;
   return row.read(picture, request);
 }
