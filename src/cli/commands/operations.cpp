@@ -91,14 +91,14 @@ void Explain(const Operation& operation, ResultOutput& output) {
   }
   output.Line(usage);
   output.Line("");
-  output.Line(Tr(operation.help));
+  output.Line(operation.help);
   if (!operation.parameters.empty()) output.Line("");
   for (const Parameter& row : operation.parameters) {
     const auto preset = DefaultText(row, KeyTextInForce);
-    std::string line = "  " + Padded(row.name, 12) + " " + Tr(row.help);
+    std::string line = "  " + Padded(row.name, 12) + " " + row.help;
     output.Line(line);
     line = "  " + Padded("", 12) + " " + Takes(row);
-    if (!preset || !preset->empty()) line.append("; ").append(preset ? Tr("default %1", *preset) : Tr("required"));
+    line += !preset ? "; required" : preset->empty() ? "" : "; default " + *preset;
     output.Line(line);
   }
   output.Line("");
@@ -130,7 +130,7 @@ int RunOperations(bool json, const CommandContext& context) {
     if (first || operation->family != family) output.Line(std::string(first ? "" : "\n") + std::string(FamilyName(operation->family)));
     family = operation->family;
     first = false;
-    output.Line("  " + Padded(operation->name, 16) + Tr(operation->help));
+    output.Line("  " + Padded(operation->name, 16) + operation->help);
   }
   return kExitOk;
 }

@@ -1,0 +1,92 @@
+// Slow-scan television frames (HRZ): 256 x 240 pixels from the top, red, green, blue, of 6 bits in a byte each; nothing
+// else, so that a file is known by its size alone.
+//
+// The reader takes bytes whose upper bits are set by their lower six. The writer drops the lower two bits of each color.
+// Source: the format has no official description; "HRZ" in the Just Solve the File Format Problem wiki (Archive Team).
+#include "formats/hrz/hrz.h"
+
+#include <array>
+
+#include "core/byte_writer.h"
+#include "platform/file_view.h"
+#include "processing/promote.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr int32_t kWidth = 256, kHeight = 240;
+constexpr size_t kRowSize = 3 * kWidth;
+constexpr uint64_t kFileSize = kRowSize * kHeight;
+
+constexpr uint8_t Widened(uint8_t level) {
+  const uint8_t six = level & 63;
+  return static_cast<uint8_t>(six << 2 | six >> 4);
+}
+
+Status DescribePicture(const platform::FileView& file, PictureRecord& picture) {
+  picture.typeName.Clear();
+  picture.fileSize = file.FileSize();
+  if (file.FileSize() != kFileSize) return file.FileSize() < kFileSize ? Status::FileReadError : Status::DamagedFile;
+  picture.width = kWidth;
+  picture.height = kHeight;
+  picture.bitsPerPixel = 24;
+  picture.imageBytes = EstimateImageBytes(kWidth, kHeight, 24);
+  picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
+  MakeDefaultPalette(&picture.palette, nullptr, kDisplayPalette);
+  return Status::Ok;
+}
+
+}  // namespace
+
+Status HrzInfo(PictureRecord& picture, const ReadRequest& request) {
+  platform::FileView file;
+  if (!file.OpenHead(request.fileName.c_str(), 1)) return Status::FileOpenError;
+  return DescribePicture(file, picture);
+}
+
+Status HrzRead(PictureRecord& picture, const ReadRequest& request) {
+  const ProgressScope progress(picture);
+  picture.image.Free();
+  picture.alpha.Free();
+  platform::FileView file;
+  if (!file.Open(request.fileName)) return Status::FileOpenError;
+  RETURN_IF_BAD(DescribePicture(file, picture));
+  PackedImage image;
+  RETURN_IF_BAD(NewPackedImage(kWidth, kHeight, &picture.palette, 24, image));
+  const uint8_t* source = file.Bytes().data();
+  for (int32_t y = 0; y < kHeight; ++y) {
+    uint8_t* row = image.Row(y).data();
+    for (int32_t x = 0; x < kWidth; ++x, source += 3, row += 3) {
+      row[0] = Widened(source[2]);
+      row[1] = Widened(source[1]);
+      row[2] = Widened(source[0]);
+    }
+    picture.ReportRow(y);
+  }
+  if (!file.Intact()) return Status::FileReadError;
+  picture.image = std::move(image);
+  return Status::Ok;
+}
+
+Status HrzWrite(PictureRecord& picture, const WriteOptions& options) {
+  const ProgressScope progress(picture);
+  if (picture.image.Empty()) return Status::MemoryAllocationError;
+  if (picture.image.Width() != kWidth || picture.image.Height() != kHeight) return Status::UnsuitableImage;
+  ByteWriter out;
+  if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
+  BgrRows rows;
+  RETURN_IF_BAD(rows.Open(picture.image));
+  for (int32_t y = 0; y < kHeight; ++y) {
+    picture.ReportRow(y);
+    const uint8_t* bgr = rows.Row(y);
+    std::array<uint8_t, kRowSize> bytes;
+    for (size_t i = 0; i < bytes.size(); i += 3) {
+      for (size_t c = 0; c < 3; ++c) bytes[i + c] = bgr[i + 2 - c] >> 2;
+    }
+    out.Bytes(bytes);
+  }
+  return CommitOutput(out, options);
+}
+
+}  // namespace fotomill

@@ -1,0 +1,207 @@
+// Microsoft Paint of Windows 1 and 2 (MSP), little-endian: black and white.
+//
+//   offset size  field
+//        0    4  "DanM": version 1, "LinS": version 2
+//        4    4  width, height
+//        8    8  pixel shape on the screen and the printer, written 1
+//       16    4  size of the printer's page, written as that of the picture
+//       20    4  nothing
+//       24    2  makes the exclusive or of the header's words 0
+//       26    6  nothing
+//       32       version 1: rows from the top, (width + 7) / 8 bytes each
+//       32       version 2: for each row the bytes of its code, 2 bytes each; then the codes
+//
+// A set bit is white. A code is made of 0, count and value for a run, and of count and so many bytes as they are. A row
+// without any code is white.
+//
+// The reader does not look at the exclusive or, fills a row whose code ends early with white, and drops what would go
+// beyond it. The writer makes version 2 and stores the darker of two colors as black.
+// Source: J. Murray and W. vanRyper, "Encyclopedia of Graphics File Formats", 2nd edition (1996).
+#include "formats/mspaint/msp.h"
+
+#include <algorithm>
+#include <cstring>
+#include <vector>
+
+#include "core/byte_reader.h"
+#include "core/byte_writer.h"
+#include "platform/file_view.h"
+#include "processing/palette/two_colors.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr uint64_t kHeaderSize = 32;
+constexpr std::string_view kPlain = "DanM", kCoded = "LinS";
+constexpr uint8_t kWhite = 0xff;
+constexpr size_t kMostInToken = 255;
+constexpr size_t kShortestRun = 4;  // a run costs three bytes
+
+struct MspHeader {
+  bool coded = false;
+  int32_t width = 0, height = 0;
+
+  size_t RowSize() const { return (static_cast<size_t>(width) + 7) / 8; }
+};
+
+Status ParseHeader(std::span<const uint8_t> file, MspHeader& header) {
+  ByteReader bytes(file);
+  header.coded = bytes.Match(kCoded);
+  if (!header.coded && !bytes.Match(kPlain)) return file.size() < 4 ? Status::FileReadError : Status::DamagedFile;
+  header.width = bytes.Le16();
+  header.height = bytes.Le16();
+  bytes.Seek(kHeaderSize);
+  if (!bytes.Ok()) return Status::FileReadError;
+  return header.width < 1 || header.height < 1 ? Status::DamagedFile : Status::Ok;
+}
+
+void DescribePicture(const MspHeader& header, PictureRecord& picture) {
+  picture.typeName.AssignCut(header.coded ? "Microsoft Paint, version 2" : "Microsoft Paint, version 1");
+  picture.width = header.width;
+  picture.height = header.height;
+  picture.bitsPerPixel = 1;
+  picture.imageBytes = EstimateImageBytes(header.width, header.height, 1);
+  picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
+  picture.palette = BlackAndWhite(true);
+}
+
+void DecodeRow(std::span<const uint8_t> code, std::span<uint8_t> row) {
+  std::ranges::fill(row, kWhite);
+  ByteReader bytes(code);
+  for (size_t x = 0; bytes.Left() > 0 && x < row.size();) {
+    const uint8_t token = bytes.U8();
+    const size_t count = token == 0 ? bytes.U8() : token, room = std::min(count, row.size() - x);
+    if (token == 0) {
+      const uint8_t value = bytes.U8();
+      if (bytes.Ok()) std::memset(&row[x], value, room);
+    } else {
+      std::ranges::copy(bytes.Take(std::min<uint64_t>(room, bytes.Left())), &row[x]);
+    }
+    x += room;
+  }
+}
+
+Status ReadRows(std::span<const uint8_t> file, const MspHeader& header, const PictureRecord& picture, PackedImage& image) {
+  ByteReader sizes(file), bytes(file);
+  sizes.Seek(kHeaderSize);
+  bytes.Seek(kHeaderSize + (header.coded ? 2 * static_cast<uint64_t>(header.height) : 0));
+  for (int32_t y = 0; y < header.height; ++y) {
+    const auto row = image.Row(y).first(header.RowSize());
+    const auto code = bytes.Take(header.coded ? sizes.Le16() : header.RowSize());
+    if (!bytes.Ok() || !sizes.Ok()) return Status::FileReadError;
+    if (header.coded) {
+      DecodeRow(code, row);
+    } else {
+      std::ranges::copy(code, row.begin());
+    }
+    picture.ReportRow(y);
+  }
+  return Status::Ok;
+}
+
+void WriteHeader(ByteWriter& out, const PackedImage& image) {
+  const auto width = static_cast<uint16_t>(image.Width()), height = static_cast<uint16_t>(image.Height());
+  const uint16_t words[] = {0x694c, 0x536e, width, height, 1, 1, 1, 1, width, height, 0, 0};
+  uint16_t check = 0;
+  for (const uint16_t word : words) {
+    out.Le16(word);
+    check ^= word;
+  }
+  out.Le16(check);
+  out.Zeros(6);
+}
+
+void PutBytes(std::span<const uint8_t> bytes, std::vector<uint8_t>& code) {
+  while (!bytes.empty()) {
+    const auto part = bytes.first(std::min(bytes.size(), kMostInToken));
+    code.push_back(static_cast<uint8_t>(part.size()));
+    code.insert(code.end(), part.begin(), part.end());
+    bytes = bytes.subspan(part.size());
+  }
+}
+
+void EncodeRow(std::span<const uint8_t> row, std::vector<uint8_t>& code) {
+  code.clear();
+  if (std::ranges::all_of(row, [](uint8_t byte) { return byte == kWhite; })) return;
+  size_t plain = 0;  // where the bytes that no run has taken begin
+  for (size_t x = 0; x < row.size();) {
+    size_t run = 1;
+    while (x + run < row.size() && run < kMostInToken && row[x + run] == row[x]) ++run;
+    if (run >= kShortestRun) {
+      PutBytes(row.subspan(plain, x - plain), code);
+      code.insert(code.end(), {0, static_cast<uint8_t>(run), row[x]});
+      plain = x + run;
+    }
+    x += run;
+  }
+  PutBytes(row.subspan(plain), code);
+}
+
+// UnsuitableImage when the code of a row is longer than its field can say.
+Status WriteRows(ByteWriter& out, const PictureRecord& picture) {
+  const PackedImage& image = picture.image;
+  const auto width = static_cast<size_t>(image.Width());
+  const uint8_t invert = IsDarkFirst(picture.palette) ? 0 : 0xff;
+  std::vector<uint8_t> row((width + 7) / 8), code, sizes;
+  out.Zeros(2 * static_cast<uint64_t>(image.Height()));
+  for (int32_t y = 0; y < image.Height() && !out.Failed(); ++y) {
+    picture.ReportRow(y);
+    for (size_t i = 0; i < row.size(); ++i) row[i] = image.Row(y)[i] ^ invert;
+    if (width % 8 != 0) row.back() |= static_cast<uint8_t>(0xff >> width % 8);
+    EncodeRow(row, code);
+    if (code.size() > UINT16_MAX) return Status::UnsuitableImage;
+    sizes.push_back(static_cast<uint8_t>(code.size()));
+    sizes.push_back(static_cast<uint8_t>(code.size() >> 8));
+    out.Bytes(code);
+  }
+  if (!out.Failed()) out.Patch(kHeaderSize, sizes);
+  return Status::Ok;
+}
+
+}  // namespace
+
+Status MspInfo(PictureRecord& picture, const ReadRequest& request) {
+  picture.typeName.Clear();
+  platform::FileView file;
+  if (!file.OpenHead(request.fileName.c_str(), kHeaderSize)) return Status::FileOpenError;
+  picture.fileSize = file.FileSize();
+  MspHeader header;
+  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
+  DescribePicture(header, picture);
+  return Status::Ok;
+}
+
+Status MspRead(PictureRecord& picture, const ReadRequest& request) {
+  const ProgressScope progress(picture);
+  picture.image.Free();
+  picture.alpha.Free();
+  platform::FileView file;
+  if (!file.Open(request.fileName)) return Status::FileOpenError;
+  MspHeader header;
+  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
+  DescribePicture(header, picture);
+  const uint64_t least = header.coded ? 2 : header.RowSize();
+  if (file.FileSize() - kHeaderSize < least * static_cast<uint64_t>(header.height)) return Status::FileReadError;
+  PackedImage image;
+  RETURN_IF_BAD(NewPackedImage(header.width, header.height, &picture.palette, 1, image));
+  RETURN_IF_BAD(ReadRows(file.Bytes(), header, picture, image));
+  if (!file.Intact()) return Status::FileReadError;
+  picture.image = std::move(image);
+  return Status::Ok;
+}
+
+Status MspWrite(PictureRecord& picture, const WriteOptions& options) {
+  const ProgressScope progress(picture);
+  const PackedImage& image = picture.image;
+  if (image.Empty()) return Status::MemoryAllocationError;
+  if (image.Bits() > 1) return Status::TooManyColors;
+  if (image.Width() > UINT16_MAX || image.Height() > UINT16_MAX) return Status::UnsuitableImage;
+  ByteWriter out;
+  if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
+  WriteHeader(out, image);
+  RETURN_IF_BAD(WriteRows(out, picture));
+  return CommitOutput(out, options);
+}
+
+}  // namespace fotomill

@@ -1,0 +1,31 @@
+#include "formats/rows.h"
+
+#include "formats/mspaint/msp.h"
+
+namespace fotomill {
+
+namespace {
+
+using namespace std::string_view_literals;
+
+constexpr Signature kSignatures[] = {{0, "DanM"sv, "a Microsoft Paint picture"}, {0, "LinS"sv, "a Microsoft Paint picture"}};
+
+constexpr FormatEntry kRows[] = {{
+    .info = MspInfo,
+    .read = MspRead,
+    .write = MspWrite,
+    .maxBits = 1,
+    .extension = "MSP"sv,
+    .description = "(MSP) Microsoft Paint"sv,
+    .enabled = 1,
+    .flags = FMT_BITMAP,
+    .canRead = true,
+    .canWrite = true,
+    .signatures = kSignatures,
+}};
+
+}  // namespace
+
+std::span<const FormatEntry> MsPaintRows() { return kRows; }
+
+}  // namespace fotomill

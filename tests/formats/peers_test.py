@@ -1,0 +1,61 @@
+#!/usr/bin/env python3
+"""Pictures that the program writes are read by programs of others, and look as they did before.
+
+A row: the format, the sample that is converted to it, and the command that makes a portable anymap of standard input.
+"""
+import os
+import shutil
+import subprocess
+import sys
+import tempfile
+from pathlib import Path
+
+PROJECT = Path(__file__).resolve().parents[2]
+FOTOMILL = os.environ["FOTOMILL"]
+
+ROWS = [
+    ("sgi", "bmp-true-color.bmp", "sgitopnm"),
+    ("sgi", "bmp-256-colors.bmp", "sgitopnm"),
+    ("ras", "bmp-true-color.bmp", "rasttopnm"),
+    ("ras", "bmp-256-colors.bmp", "rasttopnm"),
+    ("ras", "bmp-16-colors.bmp", "rasttopnm"),
+    ("ras", "bmp-mono.bmp", "rasttopnm"),
+    ("wbmp", "bmp-mono.bmp", "wbmptopbm"),
+]
+
+
+def anymap(command, data):
+    """Width, height and the red, green, blue bytes of what a command of netpbm makes of `data`."""
+    shown = subprocess.run(command.split(), input=data, capture_output=True, check=True).stdout
+    kind, size, rest = shown.split(b"\n", 2)
+    width, height = map(int, size.split())
+    if kind == b"P4":
+        stride = (width + 7) // 8
+        bits = (rest[y * stride + x // 8] >> (7 - x % 8) & 1 for y in range(height) for x in range(width))
+        return width, height, b"".join(b"\0\0\0" if bit else b"\xff\xff\xff" for bit in bits)
+    pixels = rest.split(b"\n", 1)[1]
+    return width, height, pixels if kind == b"P6" else b"".join(bytes([value] * 3) for value in pixels)
+
+
+def main():
+    needed = {row[2] for row in ROWS} | {"bmptopnm"}
+    missing = [name for name in needed if shutil.which(name) is None]
+    if missing:
+        print("not installed:", *missing)
+        return 77
+    failures = 0
+    with tempfile.TemporaryDirectory() as folder:
+        for extension, sample, command in ROWS:
+            source = PROJECT / "samples" / sample
+            subprocess.run([FOTOMILL, "--quiet", "convert", source, "--to", extension, "--dest", folder, "--overwrite", "replace"],
+                           check=True, stdout=subprocess.DEVNULL)
+            made = (Path(folder) / source.stem).with_suffix("." + extension).read_bytes()
+            if anymap(command, made) != anymap("bmptopnm", source.read_bytes()):
+                print(f"{command} sees another picture in {sample} as {extension}")
+                failures += 1
+    print(f"{len(ROWS)} pictures, {failures} differ")
+    return 1 if failures else 0
+
+
+if __name__ == "__main__":
+    sys.exit(main())
