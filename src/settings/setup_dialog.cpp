@@ -16,7 +16,7 @@ bool setupChanged = false;
 
 std::vector<std::string> ChoiceTexts(const KeyRow& row) {
   std::vector<std::string> texts;
-  for (const ChoiceEntry* entry = row.extra.choices; entry->text != nullptr; ++entry) texts.emplace_back(entry->text);
+  for (const ChoiceEntry* entry = row.extra.choices; entry->text != nullptr; ++entry) texts.emplace_back(Tr(entry->text));
   return texts;
 }
 

@@ -62,7 +62,7 @@ class Desktop:
         runtime.mkdir(mode=0o700, exist_ok=True)
         self.environment = dict(
             os.environ, DISPLAY=":" + number, HOME=str(home), XDG_DATA_HOME=str(home / ".local/share"), XDG_CONFIG_HOME=str(home / ".config"),
-            XDG_RUNTIME_DIR=str(runtime), FOTOMILL_DATA=str(self.data), FOTOMILL_DESKTOP_LOG=str(self.log), GDK_BACKEND="x11", NO_AT_BRIDGE="1", LC_ALL="C.UTF-8",
+            XDG_RUNTIME_DIR=str(runtime), FOTOMILL_DATA=str(self.data), FOTOMILL_DESKTOP_LOG=str(self.log), GDK_BACKEND="x11", NO_AT_BRIDGE="1", LC_ALL="C.UTF-8", LANGUAGE="en",
             GTK_THEME="Adwaita", ASAN_OPTIONS=os.environ.get("ASAN_OPTIONS", "") + ":detect_leaks=0")
         self.start()
         return self

@@ -87,7 +87,7 @@ TEST_F(Reports, ExifRowsAreTheLinesOfTheText) {
     EXPECT_EQ(text.find(" [SHORT]\t") != std::string::npos, types == 1);
   }
   test::WriteText(folder_.Path("b.tif"), "II, but no more than that");
-  EXPECT_THAT(ReadExifReport(folder_.Path("b.tif"), {}).problem, HasSubstr("damaged"));
+  EXPECT_THAT(ReadExifReport(folder_.Path("b.tif"), {}).problem, HasSubstr("no valid header"));
   EXPECT_THAT(ReadExifReport(Sample("c.bmp"), {}).problem, HasSubstr("no EXIF"));
   EXPECT_EQ(ReadExifReport(folder_.Path("none.jpg"), {}).status, Status::FileOpenError);
 }
@@ -206,7 +206,7 @@ TEST_F(Reports, CompactionTellsWhatItDid) {
     ASSERT_EQ(database.Delete("/a"), 1);
   }
   EXPECT_EQ(DescribeDatabase(path), "2 records, 55.6 KB");
-  EXPECT_EQ(outcome(), std::pair(true, std::string("1 record was dropped, 1 stay. The file is 27.8 KB smaller.")));
+  EXPECT_EQ(outcome(), std::pair(true, std::string("1 record was removed, 1 remain. The file is 27.8 KB smaller.")));
   test::WriteText(path, "something else");
   EXPECT_FALSE(outcome().first);
   EXPECT_EQ(test::ReadText(path), "something else");
@@ -242,7 +242,7 @@ TEST_F(Reports, SettingsTravel) {
   const Transfer transfer = ImportConfiguration(folder_.Path("in.ini"));
   EXPECT_TRUE(transfer.ok);
   EXPECT_EQ(transfer.message,
-            "2 settings were taken over; all others stay as they are. 1 value could not be used. 1 key is unknown here.");
+            "2 settings were imported; all others are unchanged. 1 value was invalid. 1 key is unknown.");
   EXPECT_EQ(settings.JpegCompression, 42);
   EXPECT_EQ(settings.UndoLevels, 3);
   EXPECT_THAT(test::ReadText(ConfigurationPath()), HasSubstr("JpegCompression=42\n"));

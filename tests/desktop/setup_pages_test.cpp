@@ -79,12 +79,12 @@ TEST(SetupHelp, EntriesArePlainTextAndEndWhereTheNextBegins) {
               testing::StartsWith(
                   "Everything that can be adjusted is a named key. fotomill config list shows all of them with their values, "));
   EXPECT_THAT(general.text, testing::HasSubstr("\n    [Fotomill]\n    JpegCompression=85\n"));
-  EXPECT_THAT(general.text, testing::HasSubstr("\n\nWhere it lies\n\n"));
+  EXPECT_THAT(general.text, testing::HasSubstr("\n\nLocation\n\n"));
   for (const char* topic : {"OVERWRITE", "RENAME"})
     EXPECT_FALSE(HelpOn(topic).text.empty()) << topic << " has no part of its own in the manual";
   const HelpText manual = HelpOn(kManual);
   EXPECT_EQ(manual.title, "The desktop program");
-  EXPECT_THAT(manual.text, testing::HasSubstr("\nF5, F9   read the folder again, show or hide the folders at the left\n"));
+  EXPECT_THAT(manual.text, testing::HasSubstr("\nF5, F9   reload the folder, show or hide the folder tree\n"));
   EXPECT_THAT(manual.text, testing::Not(testing::ContainsRegex("[|`(]desktop-|png|--- ")))
       << "marks, addresses and pictures are left out";
 }
