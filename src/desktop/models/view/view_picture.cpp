@@ -139,6 +139,7 @@ ViewPicturePointer TurnedView(const ViewPicture& view, Orientation turn) {
   picture.fileSize = old.fileSize;
   picture.formatIndex = old.formatIndex;
   picture.pageCount = old.pageCount;
+  picture.page = old.page;
   return turned;
 }
 
