@@ -209,7 +209,7 @@ Status WriteCataloguePage(PictureRecord& page, const CataloguePageOptions& optio
     Destination destination;
     path = destination.path = name;
     if (path.size() > PathText::Capacity()) return Status::InvalidDestination;
-    const DestinationAnswer answer = MakeDestinationName(destination, name, "Catalogue page", job, taken, variant, &page);
+    const DestinationAnswer answer = MakeDestinationName(destination, name, TrLater("Catalogue page"), job, taken, variant, &page);
     if (destination.noVariant) ++job.writeAborts;
     if (answer == DestinationAnswer::Skip) return Status::FunctionCancelled;
     path = destination.path;

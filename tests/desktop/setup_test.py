@@ -85,7 +85,7 @@ def info_exif_history(folder):
         desktop.screenshot("history")
         desktop.key("Delete")
         desktop.wait(r"question Remove .a.bmp. from")
-        desktop.focus("Remove history entries")
+        desktop.focus("History entries")
         desktop.screenshot("question")
         desktop.key("alt+r")
         desktop.wait(r"history rows=1 sort=0")

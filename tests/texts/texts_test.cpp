@@ -5,6 +5,7 @@
 #include "cli/frame/commands.h"
 #include "cli/frame/libraries.h"
 #include "core/limits.h"
+#include "operations/operations.h"
 #include "platform/files.h"
 #include "registry/registry.h"
 #include "support/files.h"
@@ -49,6 +50,11 @@ TEST(Texts, TablesAreMarkedForTranslation) {
     for (const FormatSetting& setting : codec->keys) {
       if (*setting.label != '\0') expect(setting.label);
     }
+  }
+  for (const Operation* const operation : Operations()) {
+    expect(operation->label);
+    expect(operation->help);
+    for (const Parameter& parameter : operation->parameters) expect(parameter.help);
   }
   for (int32_t i = 0; i < formatCount; ++i) {
     if (const std::string_view reason = FormatRow(i).whyNot; !reason.empty()) expect(reason);

@@ -91,14 +91,14 @@ void Explain(const Operation& operation, ResultOutput& output) {
   }
   output.Line(usage);
   output.Line("");
-  output.Line(operation.help);
+  output.Line(Tr(operation.help));
   if (!operation.parameters.empty()) output.Line("");
   for (const Parameter& row : operation.parameters) {
     const auto preset = DefaultText(row, KeyTextInForce);
-    std::string line = "  " + Padded(row.name, 12) + " " + row.help;
+    std::string line = "  " + Padded(row.name, 12) + " " + Tr(row.help);
     output.Line(line);
     line = "  " + Padded("", 12) + " " + Takes(row);
-    line += !preset ? "; required" : preset->empty() ? "" : "; default " + *preset;
+    if (!preset || !preset->empty()) line.append("; ").append(preset ? Tr("default %1", *preset) : Tr("required"));
     output.Line(line);
   }
   output.Line("");
@@ -130,7 +130,7 @@ int RunOperations(bool json, const CommandContext& context) {
     if (first || operation->family != family) output.Line(std::string(first ? "" : "\n") + std::string(FamilyName(operation->family)));
     family = operation->family;
     first = false;
-    output.Line("  " + Padded(operation->name, 16) + operation->help);
+    output.Line("  " + Padded(operation->name, 16) + Tr(operation->help));
   }
   return kExitOk;
 }

@@ -196,7 +196,7 @@ void FileActions::NewFolder(const std::string& parent) {
 bool FileActions::SaveTurned(const std::string& path, Orientation turn, Turned then) {
   if (busy_) return false;
   const auto work = [path, turn](const DeedProgress&) { return TurnOneFile(path, turn); };
-  Run(Tr("rotation of %1", platform::FileNameOf(path)), work, [this, then = std::move(then)](DeedResult result) {
+  Run(Tr("Rotation of %1", platform::FileNameOf(path)), work, [this, then = std::move(then)](DeedResult result) {
     const bool done = !result.done.steps.empty();
     const std::string note = result.note;
     undo_.Add(std::move(result.done));

@@ -217,7 +217,7 @@ void FileHistoryBox::ShowFolder() {
 
 bool FileHistoryBox::Confirm(const wxString& question, const wxString& verb) {
   if (settings.FileHistoryRemovePrompt == 0) return true;
-  wxRichMessageDialog dialog(this, question, Label("File history"), wxYES_NO | wxNO_DEFAULT | wxICON_QUESTION);
+  wxRichMessageDialog dialog(this, question, Label("History entries"), wxYES_NO | wxNO_DEFAULT | wxICON_QUESTION);
   dialog.SetExtendedMessage(Label("The files themselves are not affected."));
   dialog.SetYesNoLabels("&" + verb, Label("&Keep"));
   dialog.ShowCheckBox(Label("Do not ask again (can be re-enabled in Setup)"));
