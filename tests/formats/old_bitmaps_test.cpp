@@ -1,5 +1,6 @@
 #include <gtest/gtest.h>
 
+#include "formats/cals/cals.h"
 #include "formats/hrz/hrz.h"
 #include "formats/mspaint/msp.h"
 #include "formats/sunraster/ras.h"
@@ -68,6 +69,36 @@ TEST(OldBitmaps, ColorsOfSixBits) {
   EXPECT_EQ(Encode(HrzWrite, *decoded.picture), file);
   file.push_back(0);
   EXPECT_EQ(Decode(HrzRead, file).status, Status::DamagedFile);
+}
+
+// A file of three rows of two pixels, black only at the top left, whose rows lie as a record says.
+Bytes Drawing(const std::string& records) {
+  const PicturePointer picture = PatternPicture(2, 3, 1);
+  for (int32_t i = 0; i < 6; ++i) SetPixel(picture->image, i % 2, i / 2, i > 0);
+  Bytes file = Encode(CalsWrite, *picture);
+  for (size_t i = 0; i < records.size(); ++i) file[7 * 128 + i] = static_cast<uint8_t>(records[i]);
+  return file;
+}
+
+TEST(OldBitmaps, DrawingsAreTurnedUpright) {
+  const std::pair<const char*, const char*> rows[] = {
+      {"rorient: 000,270", "1 0 / 0 0 / 0 0"}, {"RORIENT:000,090 ", "0 0 / 0 0 / 1 0"}, {"rorient: 180,090", "0 1 / 0 0 / 0 0"},
+      {"rorient: 180,270", "0 0 / 0 0 / 0 1"}, {"rorient: 270,270", "0 0 1 / 0 0 0"},   {"rorient: 090,270", "0 0 0 / 1 0 0"},
+      {"rorient: 270,090", "1 0 0 / 0 0 0"},   {"rorient: 090,090", "0 0 0 / 0 0 1"},   {"rorient: oblique", "1 0 / 0 0 / 0 0"},
+  };
+  for (const auto& [record, pixels] : rows) {
+    const Decoded decoded = Decode(CalsRead, Drawing(record));
+    EXPECT_EQ(decoded.status, Status::Ok);
+    EXPECT_EQ(PixelText(decoded.picture->image), pixels) << record;
+    EXPECT_EQ(decoded.picture->width, decoded.picture->image.Width()) << record;
+  }
+  Bytes file = Drawing("");
+  const std::string drawing(file.begin(), file.begin() + 2048);
+  EXPECT_NE(drawing.find("rpelcnt: 000002,000003"), std::string::npos);
+  file.resize(2048);
+  EXPECT_EQ(Decode(CalsRead, file).status, Status::FileReadError);
+  file.resize(2047);
+  EXPECT_EQ(Decode(CalsRead, file).status, Status::FileReadError);
 }
 
 // White on black is stored as such, whichever of the two colors comes first in the palette.
