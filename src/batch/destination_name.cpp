@@ -7,6 +7,8 @@
 #include "core/text.h"
 #include "platform/files.h"
 #include "platform/paths.h"
+#include "platform/reason.h"
+#include "texts/system_reason.h"
 #include "registry/registry.h"
 #include "texts/texts.h"
 
@@ -83,9 +85,15 @@ void StoreChecks(const OverwriteChecks& old, const OverwriteChecks& now, BatchJo
 }
 
 DestinationAnswer KeepBoth(Destination& destination, const VariantMaker& variant) {
-  if (variant(destination.path)) return DestinationAnswer::Write;
-  destination.noVariant = true;
-  return DestinationAnswer::Skip;
+  destination.search = variant(destination.path);
+  return destination.search == VariantSearch::Found ? DestinationAnswer::Write : DestinationAnswer::Skip;
+}
+
+// Whether the destination's name is taken; where that cannot be known, the file has no name.
+bool IsTaken(Destination& destination, const TakenTest& taken) {
+  const platform::Existence existence = taken(destination.path);
+  if (existence == platform::Existence::Unknown) destination.search = VariantSearch::Unknown;
+  return existence != platform::Existence::No;
 }
 
 DestinationAnswer Replace(Destination& destination, const OverwritePolicy& policy) {
@@ -125,7 +133,8 @@ DestinationAnswer AskAboutCollision(Destination& destination, const std::string&
       destination.asked = true;
       return Replace(destination, job.overwrite);
     }
-    if (!taken(destination.path)) return DestinationAnswer::Write;
+    if (!IsTaken(destination, taken)) return DestinationAnswer::Write;
+    if (destination.search != VariantSearch::Found) return DestinationAnswer::Skip;
     if (!AsksAboutCollisions(job)) return SettleUnasked(destination, job.overwrite, job.applyToRest, variant);
     question.problem.clear();
   }
@@ -188,15 +197,38 @@ std::optional<std::string> CompletedDestination(const std::string& destination, 
   return whole;
 }
 
-bool MakeNumberedVariant(std::string& path, int64_t first, int64_t last, const TakenTest& taken) {
+VariantSearch MakeNumberedVariant(std::string& path, int64_t first, int64_t last, const TakenTest& taken,
+                                  const StopToken& stop) {
   const std::string base(platform::SplitPath(path).base);
   for (int64_t number = first; number <= last; ++number) {
+    if (stop.Asked()) return VariantSearch::Stopped;
+    if (number - first == kMostVariants) return VariantSearch::GivenUp;
     std::string variant = WithBase(path, base + " [" + std::to_string(number) + "]");
-    if (taken(variant)) continue;
+    const platform::Existence existence = taken(variant);
+    if (existence == platform::Existence::Unknown) return VariantSearch::Unknown;
+    if (existence == platform::Existence::Yes) continue;
     path = std::move(variant);
-    return true;
+    return VariantSearch::Found;
   }
-  return false;
+  return VariantSearch::AllTaken;
+}
+
+void SayNoName(const Destination& destination, FileOutcome& outcome) {
+  outcome.destination.clear();
+  outcome.status = Status::ErrorCreatingFile;
+  outcome.skipped = destination.search == VariantSearch::AllTaken;
+  if (outcome.skipped) outcome.hint = Tr(kWriteAborted);
+  if (destination.search == VariantSearch::Unknown) {
+    outcome.hint = WithReason(Tr("\"%1\" cannot be created.", destination.path));
+  }
+  if (destination.search != VariantSearch::GivenUp) return;
+  outcome.status = Status::InvalidDestination;
+  outcome.hint = Tr("%1 numbered variants of \"%2\" exist already.", ThousandsText(kMostVariants), destination.path);
+}
+
+void NoteLostAttributes(FileOutcome& outcome) {
+  const std::string lost = platform::TakeLostAttributes();
+  if (outcome.replaced && !lost.empty()) outcome.note.Append(TrRecorded("Not kept from the replaced file: %1.", lost));
 }
 
 bool AsksAboutCollisions(const BatchJob& job) {
@@ -221,7 +253,8 @@ DestinationAnswer MakeDestinationName(Destination& destination, const std::strin
   const bool asked = job.naming.askName && job.prompts != nullptr;
   if (asked && !AskName(destination, source, title, job)) return DestinationAnswer::Skip;
   DestinationAnswer answer = DestinationAnswer::Write;
-  destination.taken = taken(destination.path);
+  destination.taken = IsTaken(destination, taken);
+  if (destination.search != VariantSearch::Found) return DestinationAnswer::Skip;
   if (destination.taken) {
     answer = AsksAboutCollisions(job) ? AskAboutCollision(destination, source, job, taken, variant, picture)
                                       : SettleUnasked(destination, job.overwrite, job.applyToRest, variant);

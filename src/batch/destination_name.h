@@ -8,6 +8,8 @@
 
 #include "batch/job.h"
 #include "batch/prompts.h"
+#include "platform/existence.h"
+#include "core/workers/stop_token.h"
 #include "texts/texts.h"
 
 namespace fotomill {
@@ -41,25 +43,36 @@ std::string PlannedDestination(const std::string& source, const OutputPlace& pla
 // characters or more.
 std::optional<std::string> CompletedDestination(const std::string& destination, std::string_view folder);
 
-// Whether a path cannot be had for a new file.
-using TakenTest = std::function<bool(const std::string& path)>;
+// Whether a path is taken, so that a new file cannot have it.
+using TakenTest = std::function<platform::Existence(const std::string& path)>;
 
-// Replaces `path` by the first of "NAME [first].EXT" to "NAME [last].EXT" that is not taken. False, with `path` unchanged,
-// when all are, or if there is no number in the range.
-bool MakeNumberedVariant(std::string& path, int64_t first, int64_t last, const TakenTest& taken);
+// The result of the search for a numbered variant.
+enum class VariantSearch {
+  Found,
+  AllTaken,  // every number of the range, or the range is empty
+  GivenUp,   // kMostVariants are taken
+  Unknown,   // the system cannot tell; it keeps the reason
+  Stopped,
+};
+inline constexpr int64_t kMostVariants = 100'000;
+
+// Replaces `path` by the first of "NAME [first].EXT" to "NAME [last].EXT" that is not taken. `path` is unchanged unless Found.
+// `stop` is checked before each try.
+VariantSearch MakeNumberedVariant(std::string& path, int64_t first, int64_t last, const TakenTest& taken,
+                                  const StopToken& stop = {});
 
 // The decision about an output's name.
 struct Destination {
-  std::string path;
+  std::string path = {};
   bool replace = false;    // a file of that name is to be replaced
   bool recycle = false;    // and goes to the recycle bin
   bool asked = false;      // because the user said so for this very file
-  std::string password;    // empty: none
+  std::string password = {};  // empty: none
   bool elsewhere = false;  // the user chose another folder, which is not created
   bool taken = false;      // the name was not free
-  bool noVariant = false;  // skipped because no numbered variant is free
+  VariantSearch search = VariantSearch::Found;  // anything else: skipped because no name was found
   int32_t formatIndex = kNoFormat;  // of the output; none: the job's
-  std::string extension;            // of the output, as the format has it; empty: the job's
+  std::string extension = {};       // of the output, as the format has it; empty: the job's
 };
 
 // The "path" of outputs that go to the clipboard, and the hint of a file for which no numbered
@@ -73,10 +86,17 @@ enum class DestinationAnswer : int32_t { Write = 1, Skip = 2 };
 // Decides the name of an output, whose planned path is in `destination`: asks for it if the settings say so, and what to do if
 // the file exists. `title` says what the name is for, `picture` is the new picture for previews; both are optional. `variant`
 // makes numbered variants.
-using VariantMaker = std::function<bool(std::string& path)>;
+using VariantMaker = std::function<VariantSearch(std::string& path)>;
 DestinationAnswer MakeDestinationName(Destination& destination, const std::string& source, std::string_view title, BatchJob& job,
                                       const TakenTest& taken, const VariantMaker& variant,
                                       const PictureRecord* picture = nullptr);
+
+// Records in an outcome why its file has no name: skipped with ErrorCreatingFile if all variants are taken, which counts as a
+// write abort; otherwise failed with InvalidDestination (the search was given up) or ErrorCreatingFile (the system cannot tell).
+void SayNoName(const Destination& destination, FileOutcome& outcome);
+
+// Adds to an outcome's note which attributes of the replaced file the new one does not have; takes them from the platform.
+void NoteLostAttributes(FileOutcome& outcome);
 
 // Whether the user is asked about existing files.
 bool AsksAboutCollisions(const BatchJob& job);

@@ -1,8 +1,10 @@
 #include "batch/picture_failure.h"
 
 #include "picture/picture_record.h"
+#include "platform/reason.h"
 #include "registry/registry.h"
 #include "registry/signature.h"
+#include "texts/system_reason.h"
 #include "texts/texts.h"
 
 namespace fotomill {
@@ -15,6 +17,8 @@ std::string_view LooksLike(const std::string& fileName, int32_t formatIndex) {
 
 std::string OpenHint(const std::string& fileName, Status status) {
   if (fileName.size() > PathText::Capacity()) return Tr("The path is longer than 260 characters.");
+  if (status == Status::FileOpenError) return ReasonSentence();
+  if (status == Status::FileReadError && !platform::SystemReason().empty()) return ReasonSentence();
   if (status != Status::DamagedFile && status != Status::FileReadError && status != Status::UnsupportedFunction &&
       status != Status::UnsupportedFormat) {
     return {};

@@ -14,11 +14,14 @@
 #include "metadata/exif/picture_exif.h"
 #include "operations/engine.h"
 #include "platform/files.h"
+#include "platform/held_file.h"
 #include "platform/paths.h"
+#include "platform/reason.h"
 #include "platform/temporary_file.h"
 #include "platform/volumes.h"
 #include "processing/palette/reduce.h"
 #include "registry/registry.h"
+#include "texts/system_reason.h"
 #include "texts/texts.h"
 
 namespace fotomill {
@@ -121,6 +124,9 @@ class Batch {
       if (!IsSettledEarly(i, targets[k], outcomes[k])) open.push_back(k);
     }
     if (open.empty()) return outcomes;
+    platform::HeldFile held;  // from before it is read, if an output is going to replace it
+    const bool inPlace = std::ranges::any_of(targets, [&](const OutputTarget& target) { return target.path == file.name; });
+    if (inPlace && !function_.dryRun && !held.Hold(file.name)) return {NotHeld(file)};
     PicturePointer picture;
     if (const Status status = Load(file.name, picture); status != Status::Ok) {
       return {Failure(file, status, LoadHint(file.name, status, picture.get()))};
@@ -129,7 +135,7 @@ class Batch {
       if (const Status status = function_.transform(*picture); status != Status::Ok) return {Failure(file, status)};
     }
     for (const size_t k : open) {
-      auto outcome = Produce(i, targets[k], picture, k == open.back());
+      auto outcome = Produce(i, targets[k], picture, k == open.back(), held);
       if (!outcome) return {};
       outcomes[k] = std::move(*outcome);
       outcomes[k].output = targets[k].output->label;
@@ -159,7 +165,8 @@ class Batch {
   }
 
   // Makes one output of a picture that has gone through the function's own work. All but the last one get a copy.
-  std::optional<FileOutcome> Produce(size_t i, const OutputTarget& target, PicturePointer& picture, bool last) {
+  std::optional<FileOutcome> Produce(size_t i, const OutputTarget& target, PicturePointer& picture, bool last,
+                                     platform::HeldFile& held) {
     const BatchFile& file = files_[i];
     PicturePointer copy;
     if (!last && !IsOnlyPlanned()) {
@@ -178,18 +185,15 @@ class Batch {
     destination.formatIndex = target.formatIndex;
     destination.extension = target.extension;
     if (destination.path.empty()) return Failure(file, Status::InvalidDestination, kNoName);
-    return WriteUnderFreeName(i, std::move(destination), own, target);
+    return WriteUnderFreeName(i, std::move(destination), own, target, held);
   }
+
+  static FileOutcome NotHeld(const BatchFile& file) { return Failure(file, Status::ErrorCreatingFile, ReasonSentence()); }
 
   static FileOutcome Skipped(const BatchFile& file, const Destination& destination) {
     FileOutcome outcome{.source = file.name, .destination = destination.path, .skipped = true};
-    if (destination.noVariant) {
-      outcome.status = Status::ErrorCreatingFile;
-      outcome.destination.clear();
-      outcome.hint = Tr(kWriteAborted);
-    } else {
-      outcome.hint = destination.taken ? Tr("skipped: %1 exists.", destination.path) : Tr("skipped.");
-    }
+    outcome.hint = destination.taken ? Tr("skipped: %1 exists.", destination.path) : Tr("skipped.");
+    if (destination.search != VariantSearch::Found) SayNoName(destination, outcome);
     return outcome;
   }
 
@@ -199,9 +203,11 @@ class Batch {
     {
       const std::lock_guard lock(mutex_);
       if (!rules_.overwrite.skip) return false;
-      if (IsIndependent(source, destination.path)) return destination.taken = names_.Taken(destination.path, source);
+      if (IsIndependent(source, destination.path)) {
+        return destination.taken = names_.Taken(destination.path, source) == platform::Existence::Yes;
+      }
     }
-    (void)run_.InTurn(i, [&] { destination.taken = IsTaken(destination.path, source); });
+    (void)run_.InTurn(i, [&] { destination.taken = IsTaken(destination.path, source) == platform::Existence::Yes; });
     return destination.taken;
   }
 
@@ -233,12 +239,14 @@ class Batch {
   bool Reduces(const OutputTarget& target) const { return function_.reduce || target.kept; }
 
   // Settles the name and writes, again when someone else has taken the name since it was found free.
-  std::optional<FileOutcome> WriteUnderFreeName(size_t i, Destination planned, PictureRecord& picture, const OutputTarget& target) {
+  std::optional<FileOutcome> WriteUnderFreeName(size_t i, Destination planned, PictureRecord& picture, const OutputTarget& target,
+                                                platform::HeldFile& source) {
     const BatchFile& file = files_[i];
     for (int attempt = 0; attempt < kMostLostRaces; ++attempt) {
       Destination destination = planned;
       bool cancelled = false;
       if (Settle(i, destination, picture, cancelled) == DestinationAnswer::Skip) {
+        cancelled = cancelled || destination.search == VariantSearch::Stopped;
         return cancelled ? std::nullopt : std::optional(Skipped(file, destination));
       }
       if (destination.path.size() > PathText::Capacity()) {
@@ -246,6 +254,11 @@ class Batch {
         return Failure(file, Status::InvalidDestination, kTooLong);
       }
       const bool replaces = destination.replace && platform::FileExists(destination.path);
+      platform::HeldFile held;
+      if (!function_.dryRun && destination.replace && !Hold(destination, source, held)) {
+        GiveBack(destination.path);
+        return job_.stop.Token().Asked() ? std::nullopt : std::optional(NotHeld(file));
+      }
       std::string hint;
       const Status status = function_.dryRun ? Status::Ok : Write(picture, destination, target, hint);
       if (status == Status::Ok) return Written(file, destination, replaces, picture);
@@ -255,6 +268,12 @@ class Batch {
       if (!lostRace) return Failure(file, status, hint.empty() ? WriteHint(destination, status, picture, target) : hint);
     }
     return Failure(file, Status::ErrorCreatingFile, Tr(kWriteAborted));
+  }
+
+  // Holds the file to be replaced. One that goes to the recycle bin is not lost, whoever has changed it.
+  static bool Hold(const Destination& destination, platform::HeldFile& source, platform::HeldFile& held) {
+    if (destination.recycle) source.Release();
+    return destination.recycle || source.IsHeldAs(destination.path) || held.Hold(destination.path);
   }
 
   void GiveBack(const std::string& path) {
@@ -282,13 +301,19 @@ class Batch {
     if (asksEveryName_ || !IsIndependent(source, destination.path)) return false;
     Destination settled = destination;
     answer = DestinationAnswer::Write;
-    settled.taken = names_.Taken(settled.path, source);
+    const platform::Existence existence = names_.Taken(settled.path, source);
+    if (existence == platform::Existence::Unknown) {
+      destination.search = VariantSearch::Unknown;
+      answer = DestinationAnswer::Skip;
+      return true;
+    }
+    settled.taken = existence == platform::Existence::Yes;
     if (settled.taken) {
       if (rules_.asks) return false;
       bool free = true;
       const TakenTest taken = [&](const std::string& path) {
         free = !names_.IsExpected(path);
-        return free && names_.Taken(path, source);
+        return free ? names_.Taken(path, source) : platform::Existence::No;
       };
       answer = SettleUnasked(settled, rules_.overwrite, rules_.applyToRest,
                              [&](std::string& path) { return MakeVariant(path, taken); });
@@ -318,23 +343,23 @@ class Batch {
     if (answer == DestinationAnswer::Write && destination.replace && !destination.asked) {
       if (names_.TakenByRun(destination.path, source)) {
         destination.replace = destination.recycle = false;
-        destination.noVariant =
-            !MakeVariant(destination.path, [&](const std::string& path) { return names_.Taken(path, source); });
+        destination.search =
+            MakeVariant(destination.path, [&](const std::string& path) { return names_.Taken(path, source); });
       }
-      if (destination.noVariant) answer = DestinationAnswer::Skip;
+      if (destination.search != VariantSearch::Found) answer = DestinationAnswer::Skip;
     }
     TakeRules();
     if (answer == DestinationAnswer::Write) names_.Give(destination.path);
     return answer;
   }
 
-  bool IsTaken(const std::string& path, const std::string& source) const {
+  platform::Existence IsTaken(const std::string& path, const std::string& source) const {
     const std::lock_guard lock(mutex_);
     return names_.Taken(path, source);
   }
 
-  bool MakeVariant(std::string& path, const TakenTest& taken) {
-    return names_.MakeVariant(path, job_.naming.firstVariant, job_.naming.lastVariant, taken);
+  VariantSearch MakeVariant(std::string& path, const TakenTest& taken) {
+    return names_.MakeVariant(path, job_.naming.firstVariant, job_.naming.lastVariant, taken, job_.stop.Token());
   }
 
   // Codecs may take less than their row says; colors are then reduced further, step by step.
@@ -394,7 +419,10 @@ class Batch {
       outcome.destination = destination.path;
       return outcome;
     }
-    return {.source = file.name, .destination = destination.path, .replaced = replaces, .note = LostMetadata(picture, destination)};
+    FileOutcome outcome{.source = file.name, .destination = destination.path, .replaced = replaces};
+    outcome.note = LostMetadata(picture, destination);
+    if (!function_.dryRun) NoteLostAttributes(outcome);
+    return outcome;
   }
 
   // Names the metadata the format could not store; shown by --verbose.
@@ -412,13 +440,14 @@ class Batch {
     if (status == Status::TooManyColors) return Reduces(target) ? std::string() : function_.reduceHint;
     const std::string& path = destination.path;
     const std::string folder = FolderOf(path);
+    if (status == Status::ErrorWritingFile && !platform::SystemReason().empty()) return ReasonSentence();
     const bool full = status == Status::ErrorWritingFile && platform::FreeSpace(folder) < picture.image.Bytes().size();
     if (full) return Tr("Not enough disk space at the destination.");
     if (status != Status::ErrorCreatingFile) return {};
     if (platform::IsFolder(path)) return Tr("\"%1\" is a folder.", path);
-    if (!folder.empty() && !platform::IsFolder(folder)) return Tr("The folder \"%1\" does not exist.", folder);
+    if (!folder.empty() && !platform::IsFolder(folder)) return WithReason(Tr("The folder \"%1\" does not exist.", folder));
     if (destination.recycle && !platform::HasTrash(path)) return Tr("There is no recycle bin for \"%1\".", path);
-    return Tr("\"%1\" cannot be created.", path);
+    return WithReason(Tr("\"%1\" cannot be created.", path));
   }
 
   const std::span<const BatchFile> files_;

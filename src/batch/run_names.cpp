@@ -4,7 +4,6 @@
 #include <string_view>
 
 #include "batch/destination_name.h"
-#include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
 
@@ -53,8 +52,8 @@ bool RunNames::TakenByRun(const std::string& path, const std::string& source) co
   return given_.contains(key) || (sources_.contains(key) && key != Key(source));
 }
 
-bool RunNames::Taken(const std::string& path, const std::string& source) const {
-  return TakenByRun(path, source) || platform::FileExists(path);
+platform::Existence RunNames::Taken(const std::string& path, const std::string& source) const {
+  return TakenByRun(path, source) ? platform::Existence::Yes : platform::ExistenceOf(path);
 }
 
 void RunNames::Give(const std::string& path) { given_.insert(Key(path)); }
@@ -64,16 +63,17 @@ void RunNames::TakeBack(const std::string& path) {
   ForgetVariants();
 }
 
-bool RunNames::MakeVariant(std::string& path, int64_t first, int64_t last, const TakenTest& taken) {
+VariantSearch RunNames::MakeVariant(std::string& path, int64_t first, int64_t last, const TakenTest& taken,
+                                    const StopToken& stop) {
   int64_t& start = variants_.try_emplace(Key(path), first).first->second;
   int64_t next = start;
   const auto counted = [&](const std::string& variant) {
     ++next;
     return taken(variant);
   };
-  if (!MakeNumberedVariant(path, start, last, counted)) return false;
-  start = next;
-  return true;
+  const VariantSearch search = MakeNumberedVariant(path, start, last, counted, stop);
+  if (search == VariantSearch::Found) start = next;
+  return search;
 }
 
 std::string RunNames::Key(const std::string& path) const {

@@ -30,7 +30,7 @@ class RunNames {
   // Whether another file of the run has the path as its source or output.
   bool TakenByRun(const std::string& path, const std::string& source) const;
   // The same, or there is a file of that name.
-  bool Taken(const std::string& path, const std::string& source) const;
+  platform::Existence Taken(const std::string& path, const std::string& source) const;
 
   // The path made absolute, by which files are compared.
   std::string Key(const std::string& path) const;
@@ -43,7 +43,7 @@ class RunNames {
   void ForgetVariants() { variants_.clear(); }
 
   // As MakeNumberedVariant; numbers that this run has found taken before are not tried again.
-  bool MakeVariant(std::string& path, int64_t first, int64_t last, const TakenTest& taken);
+  VariantSearch MakeVariant(std::string& path, int64_t first, int64_t last, const TakenTest& taken, const StopToken& stop);
 
  private:
   std::string folder_;                                 // what relative paths are relative to

@@ -5,10 +5,11 @@
 #include <random>
 
 #include "core/plain_name.h"
-#include "files/rename_log.h"
 #include "platform/clock.h"
+#include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
+#include "texts/system_reason.h"
 #include "texts/texts.h"
 
 namespace fotomill {
@@ -21,7 +22,7 @@ constexpr const char* kNotSafe = TrLater("It could not be recorded for --undo.")
 // Has the job remember the number that the next run begins with: a few times a second at most, and at the end.
 class NextNumber {
  public:
-  NextNumber(const BatchJob& job, bool on) : job_(job), on_(on && job.remember) {}
+  NextNumber(const BatchJob& job, bool on) : job_(job), on_(on) {}
   ~NextNumber() { Store(); }
   NextNumber(const NextNumber&) = delete;
   NextNumber& operator=(const NextNumber&) = delete;
@@ -59,12 +60,15 @@ std::string RenameHint(const std::string& path, const BatchJob& job) {
   return {};
 }
 
+// Whether a noted rename has happened and can be taken back. A killed run may have noted one that it did not do, or have taken
+// one back.
+bool HasHappened(const RenamedFile& file) { return platform::FileExists(file.to) || !platform::FileExists(file.from); }
+
 FileUse Use(const std::string& path, bool removed) {
   return {platform::AbsolutePath(path), FileFunction::MoveAndCopy, kOwnTime, static_cast<int32_t>(platform::Now()), removed};
 }
 
-FileOutcome RenameOne(const BatchFile& file, const SequentialRenameRules& rules, RenamedFiles& files, BatchJob& job,
-                      RenameLog* log) {
+FileOutcome RenameOne(const BatchFile& file, const SequentialRenameRules& rules, RenamedFiles& files, BatchJob& job) {
   FileOutcome outcome{.source = file.name, .status = file.status, .hint = file.hint};
   if (outcome.status == Status::Ok && (!files.Exists(file.name) || !platform::IsRegularFile(file.name))) {
     outcome.status = Status::FileOpenError;
@@ -74,12 +78,12 @@ FileOutcome RenameOne(const BatchFile& file, const SequentialRenameRules& rules,
   outcome.status = RenameSequentially(job, outcome.destination, rules, files);
   if (outcome.status != Status::Ok) {
     outcome.hint = RenameHint(outcome.destination, job);
+    if (outcome.hint.empty()) outcome.hint = ReasonSentence();
   } else if (outcome.destination == file.name) {
     outcome.skipped = true;
     outcome.hint = Tr("skipped: the new name is not available.");
-  } else if (log != nullptr) {
-    const bool noted = log->Add({platform::AbsolutePath(file.name), platform::AbsolutePath(outcome.destination)});
-    if (!noted) outcome.note = TrRecorded(kNotSafe);
+  } else if (!files.IsNoted()) {
+    outcome.note = TrRecorded(kNotSafe);
   }
   return outcome;
 }
@@ -92,7 +96,12 @@ bool RenamedFiles::Exists(const std::string& path) const {
 }
 
 platform::CommitResult RenamedFiles::Rename(const std::string& from, const std::string& to) {
-  if (!dryRun_) return platform::RenameFile(from, to, platform::Existing::Refuse);
+  if (!dryRun_) {
+    noted_ = log_ == nullptr || log_->Intend({platform::AbsolutePath(from), platform::AbsolutePath(to)});
+    const platform::CommitResult result = platform::RenameFile(from, to, platform::Existing::Refuse);
+    if (log_ != nullptr) log_->Settle(result == platform::CommitResult::Done);
+    return result;
+  }
   there_.erase(from);
   gone_.insert(from);
   gone_.erase(to);
@@ -148,16 +157,17 @@ void RunRename(std::span<const BatchFile> files, const RenameOptions& options, B
   std::vector<size_t> order(files.size());
   std::iota(order.begin(), order.end(), size_t{0});
   if (rules.random) order = RandomOrder(files.size(), options.seed ? *options.seed : std::random_device()());
-  RenamedFiles renamed(options.dryRun);
-  RenameLog log;
-  NextNumber next(job, rules.update && !options.dryRun);
+  const bool remembers = rules.update && !options.dryRun && job.remember;
+  RenameLog log(remembers ? std::optional(rules.number) : std::nullopt);
+  RenamedFiles renamed(options.dryRun, &log);
+  NextNumber next(job, remembers);
   const StopToken stop = job.stop.Token();
   uint32_t done = 0;
   for (const size_t place : order) {
     if (stop.Asked() || (job.box != nullptr && !job.box->GoesOn())) break;
     job.source.AssignCut(files[place].name);
     const uint32_t before = job.rename.number;
-    const FileOutcome outcome = RenameOne(files[place], rules, renamed, job, options.dryRun ? nullptr : &log);
+    const FileOutcome outcome = RenameOne(files[place], rules, renamed, job);
     if (job.rename.number != before) next.Set(job.rename.number);
     ReportOutcome(job, outcome, done++, static_cast<uint32_t>(files.size()));
   }
@@ -166,10 +176,14 @@ void RunRename(std::span<const BatchFile> files, const RenameOptions& options, B
 }
 
 bool UndoRename(const std::set<std::string>& only, bool dryRun, BatchJob& job) {
+  RenameLog lock;
+  if (!dryRun && !lock.LockForUndo()) return false;
   const auto log = ReadRenameLog();
   if (!log) return false;
-  std::vector<RenamedFile> wanted, left, failed;
-  for (const RenamedFile& file : *log) (only.empty() || only.contains(file.to) ? wanted : left).push_back(file);
+  RenameHistory remaining{.files = {}, .number = log->number};
+  std::vector<RenamedFile>& left = remaining.files;
+  std::vector<RenamedFile> wanted, failed;
+  for (const RenamedFile& file : log->files) (only.empty() || only.contains(file.to) ? wanted : left).push_back(file);
   if (!OpenProgressBox(job)) return true;
   RenamedFiles files(dryRun);
   const StopToken stop = job.stop.Token();
@@ -177,13 +191,14 @@ bool UndoRename(const std::set<std::string>& only, bool dryRun, BatchJob& job) {
   const auto count = static_cast<uint32_t>(wanted.size());
   for (; !wanted.empty() && !stop.Asked(); wanted.pop_back()) {
     const RenamedFile& file = wanted.back();
+    if (!dryRun && !HasHappened(file)) continue;
     FileOutcome outcome{.source = file.to, .destination = file.from};
     if (!files.Exists(file.to)) {
       outcome.status = Status::FileOpenError;
       outcome.hint = Tr("The file does not exist.");
     } else if (files.Exists(file.from) || files.Rename(file.to, file.from) != platform::CommitResult::Done) {
       outcome.status = Status::RenameError;
-      outcome.hint = files.Exists(file.from) ? Tr("\"%1\" exists.", file.from) : "";
+      outcome.hint = files.Exists(file.from) ? Tr("\"%1\" exists.", file.from) : ReasonSentence();
     } else {
       job.uses.push_back(Use(file.to, true));
       job.uses.push_back(Use(file.from, false));
@@ -196,8 +211,11 @@ bool UndoRename(const std::set<std::string>& only, bool dryRun, BatchJob& job) {
   left.insert(left.end(), failed.rbegin(), failed.rend());  // the last one first again, when it is tried again
   if (dryRun) {
     job.uses.clear();
-  } else if (!log->empty() && !WriteRenameLog(left)) {
+  } else if (!log->files.empty() && !WriteRenameLog(remaining)) {
     job.errors = true;
+  }
+  if (!dryRun && left.empty() && log->number && job.remember) {
+    job.remember(Remembered::NextRenameNumber, static_cast<int32_t>(std::min<uint32_t>(*log->number, INT32_MAX)));
   }
   FinishProgress(job);
   return true;

@@ -10,6 +10,7 @@
 
 #include "batch/job.h"
 #include "batch/run.h"
+#include "files/rename_log.h"
 #include "platform/files.h"
 
 namespace fotomill {
@@ -31,14 +32,19 @@ struct SequentialRenameRules {
 // The files that are renamed. In a dry run they only seem to be.
 class RenamedFiles {
  public:
-  explicit RenamedFiles(bool dryRun) : dryRun_(dryRun) {}
+  // Each rename is noted in `log`, if there is one, before it is done.
+  explicit RenamedFiles(bool dryRun, RenameLog* log = nullptr) : dryRun_(dryRun), log_(log) {}
   // Whether a path is taken; in a dry run, whether it would be by now.
   bool Exists(const std::string& path) const;
   // Renames without replacing anything: Taken when the new name is. A dry run only remembers it.
   platform::CommitResult Rename(const std::string& from, const std::string& to);
+  // Whether the last rename was noted.
+  bool IsNoted() const { return noted_; }
 
  private:
   const bool dryRun_;
+  RenameLog* const log_;
+  bool noted_ = true;
   std::set<std::string> gone_, there_;
 };
 
@@ -64,7 +70,8 @@ struct RenameOptions {
 // was renamed can be taken back by UndoRename until the next run.
 void RunRename(std::span<const BatchFile> files, const RenameOptions& options, BatchJob& job);
 // Gives the files of the last run their old names again, the last one first; with `only`, absolute paths, those of them
-// only. What cannot be taken back can be tried again. Unreadable: false, nothing was done.
+// only. What cannot be taken back can be tried again. When all is taken back, the next run counts from where the last one did.
+// Unreadable, or locked by another program: false, nothing was done.
 bool UndoRename(const std::set<std::string>& only, bool dryRun, BatchJob& job);
 
 }  // namespace fotomill

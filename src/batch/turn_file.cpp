@@ -9,10 +9,11 @@
 #include "metadata/exif/picture_exif.h"
 #include "platform/file_view.h"
 #include "platform/files.h"
+#include "platform/held_file.h"
 #include "platform/paths.h"
 #include "platform/temporary_file.h"
-#include "platform/unchanged_file.h"
 #include "registry/registry.h"
+#include "texts/system_reason.h"
 #include "texts/texts.h"
 
 namespace fotomill {
@@ -74,7 +75,8 @@ class Turning {
   }
 
   Status Turn() {
-    facts_ = platform::FactsOf(source_);
+    if (source_ == destination_ && !held_.Hold(source_)) return Fail(Status::ErrorCreatingFile, ReasonSentence());
+    stamp_ = source_ == destination_ ? held_.Stamp() : platform::StampOf(source_);
     PicturePointer picture;
     if (const Status status = LoadPictureInfo({.fileName = source_, .options = read_}, picture); status != Status::Ok) {
       return Fail(status, OpenHint(source_, status));
@@ -87,7 +89,7 @@ class Turning {
 
   Status TurnAsJpeg() {
     platform::FileView file;
-    if (!file.Open(source_)) return Status::FileOpenError;
+    if (!file.Open(source_)) return Fail(Status::FileOpenError, ReasonSentence());
     std::vector<uint8_t> made;
     JpegTurnResult turned;
     const JpegTurnWish wish{
@@ -123,7 +125,9 @@ class Turning {
   // Writes a temporary file first; it replaces the old file only if it reads back identically.
   Status WriteDecoded(PictureRecord& picture) {
     platform::TemporaryFile working;
-    if (!working.Create(std::string(".").append(platform::ExtensionOf(source_)))) return Status::ErrorCreatingFile;
+    if (!working.Create(std::string(".").append(platform::ExtensionOf(source_)))) {
+      return Fail(Status::ErrorCreatingFile, ReasonSentence());
+    }
     RefreshExif(picture);
     WriteOptions plain{.encode = options_.encode};
     plain.lossless = true;
@@ -146,16 +150,20 @@ class Turning {
   Status WriteUnlessThere(std::span<const uint8_t> bytes, bool same) {
     if (same && source_ == destination_) return Status::Ok;
     ByteWriter out;
-    if (!out.Create(destination_)) return Fail(Status::ErrorCreatingFile, Tr("\"%1\" cannot be created.", destination_));
+    const bool replaces = source_ != destination_ && options_.existing == platform::Existing::Replace;
+    if (replaces && !held_.Hold(destination_)) return Fail(Status::ErrorCreatingFile, ReasonSentence());
+    if (!out.Create(destination_)) {
+      return Fail(Status::ErrorCreatingFile, WithReason(Tr("\"%1\" cannot be created.", destination_)));
+    }
     out.Bytes(bytes);
     WriteOptions options = options_;
     bool unchanged = true;  // a file that another program changed meanwhile is not replaced
     options.makeWay = [&] {
-      return (!options_.makeWay || options_.makeWay()) && (unchanged = platform::IsUnchanged(source_, facts_));
+      return (!options_.makeWay || options_.makeWay()) && (unchanged = platform::StampOf(source_) == stamp_);
     };
     const Status status = CommitOutput(out, options);
-    if (!unchanged) return Fail(Status::FileReadError, Tr("The file was changed by another program."));
-    RETURN_IF_BAD(status);
+    if (!unchanged || held_.Changed()) return Fail(Status::FileReadError, Tr("The file was changed by another program."));
+    if (status != Status::Ok) return Fail(status, ReasonSentence());
     result_.changed = true;
     return Status::Ok;
   }
@@ -164,7 +172,8 @@ class Turning {
   const TurnRequest& request_;
   const ReadOptions& read_;
   const WriteOptions& options_;
-  platform::FileFacts facts_;  // of the source when it was not read yet
+  platform::HeldFile held_;    // the file to be replaced
+  platform::FileStamp stamp_;  // of the source when it was not read yet
   TurnedFile result_;
 };
 

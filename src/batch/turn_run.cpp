@@ -9,6 +9,7 @@
 #include "batch/run_names.h"
 #include "platform/files.h"
 #include "platform/paths.h"
+#include "texts/system_reason.h"
 #include "texts/texts.h"
 
 namespace fotomill {
@@ -65,6 +66,7 @@ class TurnBatch {
     } else if (!run_.InTurn(i, [&] { goesOn = Settle(outcome); })) {
       return std::nullopt;
     }
+    if (!goesOn && outcome.status != Status::Ok && job_.stop.Token().Asked()) return std::nullopt;
     if (goesOn && !function_.dryRun) Turn(outcome);
     return outcome;
   }
@@ -77,11 +79,17 @@ class TurnBatch {
       outcome.skipped = names_.TakenByRun(planned, outcome.source);
       if (outcome.skipped) outcome.hint = Tr("listed twice; already turned.");
       outcome.replaced = true;
-    } else if (names_.Taken(planned, outcome.source)) {
+    } else if (const platform::Existence taken = names_.Taken(planned, outcome.source); taken == platform::Existence::Yes) {
       SettleTaken(outcome);
+    } else if (taken == platform::Existence::Unknown) {
+      Destination destination;
+      destination.path = planned;
+      destination.search = VariantSearch::Unknown;
+      SayNoName(destination, outcome);
     }
-    if (!outcome.skipped) names_.Give(outcome.destination);
-    return !outcome.skipped;
+    const bool goesOn = !outcome.skipped && outcome.status == Status::Ok;
+    if (goesOn) names_.Give(outcome.destination);
+    return goesOn;
   }
 
   void SettleTaken(FileOutcome& outcome) {
@@ -93,11 +101,13 @@ class TurnBatch {
     outcome.skipped = job_.overwrite.skip;
     if (outcome.skipped) {
       outcome.hint = Tr("skipped: %1 exists.", outcome.destination);
-    } else if (!names_.MakeVariant(outcome.destination, job_.naming.firstVariant, job_.naming.lastVariant, taken)) {
-      outcome.skipped = true;
-      outcome.status = Status::ErrorCreatingFile;
-      outcome.hint = Tr(kWriteAborted);
+      return;
     }
+    Destination destination;
+    destination.path = outcome.destination;
+    destination.search = names_.MakeVariant(outcome.destination, job_.naming.firstVariant, job_.naming.lastVariant, taken,
+                                            job_.stop.Token());
+    if (destination.search != VariantSearch::Found) SayNoName(destination, outcome);
   }
 
   void Turn(FileOutcome& outcome) const {
@@ -111,7 +121,7 @@ class TurnBatch {
     }
     TurnedFile turned;
     if (!folder.empty() && !platform::MakeFolders(folder)) {
-      turned = {.status = Status::ErrorCreatingFile, .hint = Tr("The folder \"%1\" does not exist.", folder)};
+      turned = {.status = Status::ErrorCreatingFile, .hint = WithReason(Tr("The folder \"%1\" does not exist.", folder))};
     } else {
       turned = TurnPictureFile(outcome.source, outcome.destination, function_.request, job_.read, options);
     }
@@ -119,6 +129,7 @@ class TurnBatch {
     outcome.status = turned.status;
     outcome.hint = kept ? turned.hint : std::string(Tr("There is not enough disk space to keep the old file for undo."));
     outcome.note = turned.note;
+    if (turned.changed) NoteLostAttributes(outcome);
     outcome.skipped = turned.status == Status::Ok && !turned.changed;
     if (outcome.skipped) outcome.hint = turned.note.empty() ? Tr("already in this orientation.") : turned.note.shown;
     if (turned.status != Status::Ok) outcome.destination.clear();

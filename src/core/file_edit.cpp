@@ -1,7 +1,9 @@
 #include "core/file_edit.h"
 
 #include "platform/files.h"
+#include "platform/held_file.h"
 #include "platform/paths.h"
+#include "platform/reason.h"
 #include "platform/store_file.h"
 
 namespace fotomill {
@@ -24,7 +26,9 @@ class PathLock {
     }
   }
   ~PathLock() {
+    const std::string reason = platform::SystemReason();  // why the change failed
     if (held_) (void)platform::DeleteFile(path_);
+    platform::KeepReason(reason);
   }
   PathLock(const PathLock&) = delete;
   PathLock& operator=(const PathLock&) = delete;
@@ -37,15 +41,9 @@ class PathLock {
   bool held_ = false;
 };
 
-}  // namespace
+constexpr int kMostChanges = 10;  // by other programs, between reading and writing
 
-EditResult EditTextFile(const std::string& path, uint64_t most, const std::function<void(std::string& contents)>& edit) {
-  const platform::PathParts parts = platform::SplitPath(path);
-  const std::string folder = std::string(parts.drive) + std::string(parts.folder);
-  if (path.empty() || (!folder.empty() && !platform::MakeFolders(folder))) return EditResult::Failed;
-  const PathLock lock(path);
-  if (!lock.Held()) return EditResult::Failed;
-
+EditResult EditOnce(const std::string& path, uint64_t most, const std::function<void(std::string& contents)>& edit) {
   std::string contents;
   switch (platform::ReadWholeFile(path, most, contents)) {
     case platform::ReadResult::Done:
@@ -58,6 +56,22 @@ EditResult EditTextFile(const std::string& path, uint64_t most, const std::funct
   if (changed == contents) return EditResult::Unchanged;
   if (changed.size() > most) return EditResult::Failed;  // nobody could read it again
   return platform::WriteWholeFile(path, changed) ? EditResult::Done : EditResult::Failed;
+}
+
+}  // namespace
+
+EditResult EditTextFile(const std::string& path, uint64_t most, const std::function<void(std::string& contents)>& edit) {
+  const platform::PathParts parts = platform::SplitPath(path);
+  const std::string folder = std::string(parts.drive) + std::string(parts.folder);
+  if (path.empty() || (!folder.empty() && !platform::MakeFolders(folder))) return EditResult::Failed;
+  const PathLock lock(path);
+  if (!lock.Held()) return EditResult::Failed;
+  platform::HeldFile file;  // an editor knows nothing of our lock
+  for (int tries = 0;; ++tries) {
+    if (!file.Hold(path)) return EditResult::Failed;
+    const EditResult result = EditOnce(path, most, edit);
+    if (result != EditResult::Failed || !file.Changed() || tries == kMostChanges) return result;
+  }
 }
 
 }  // namespace fotomill

@@ -1,8 +1,10 @@
 #include "files/rename_log.h"
 
+#include <algorithm>
 #include <string_view>
 
 #include "core/data_folder.h"
+#include "core/whole_number.h"
 #include "platform/files.h"
 #include "platform/paths.h"
 
@@ -12,6 +14,7 @@ namespace {
 
 constexpr const char* kLogName = "FMWRenameUndo.dat";
 constexpr uint64_t kLongestLog = uint64_t{256} << 20;
+constexpr int kMostTries = 1000;  // for a log that others replace
 
 std::string RecordOf(const RenamedFile& file) {
   std::string record = file.from;
@@ -28,44 +31,95 @@ bool TakeText(std::string_view& contents, std::string& text) {
   return true;
 }
 
-}  // namespace
-
-bool RenameLog::Begin() {
-  using platform::StoreFile;
-  const std::string path = DataFile(kLogName);
-  if (path.empty() || !platform::MakeFolders(std::string(platform::SplitPath(path).folder))) return false;
-  if (platform::FileExists(path) && !platform::DeleteFile(path)) return false;
-  return file_.Open(path, StoreFile::Mode::CreateNew) == StoreFile::OpenResult::Done;
+RenameHistory Parsed(std::string_view contents) {
+  RenameHistory history;
+  for (RenamedFile file; TakeText(contents, file.from) && TakeText(contents, file.to);) {
+    if (!file.from.empty()) {
+      history.files.push_back(file);
+    } else if (const auto number = ParseNumber<uint32_t>(file.to)) {
+      history.number = std::min(*number, history.number.value_or(UINT32_MAX));
+    }
+  }
+  return history;
 }
 
-bool RenameLog::Add(const RenamedFile& file) {
-  if (!file_.IsOpen() && !failed_) failed_ = !Begin();
-  if (failed_) return false;
+std::string ContentsOf(const RenameHistory& history) {
+  std::string contents;
+  if (history.number) contents = RecordOf({{}, std::to_string(*history.number)});
+  for (const RenamedFile& file : history.files) contents += RecordOf(file);
+  return contents;
+}
+
+}  // namespace
+
+// Who waited may find that the log was replaced meanwhile.
+bool RenameLog::LockFile(bool create) {
+  using platform::StoreFile;
+  const std::string path = DataFile(kLogName);
+  for (int tries = 0; tries < kMostTries; ++tries) {
+    StoreFile::OpenResult opened = file_.Open(path, StoreFile::Mode::ReadWrite);
+    if (opened == StoreFile::OpenResult::Missing && create) opened = file_.Open(path, StoreFile::Mode::CreateNew);
+    if (opened == StoreFile::OpenResult::Exists) continue;  // another run was faster
+    if (opened == StoreFile::OpenResult::Missing) return true;
+    if (opened != StoreFile::OpenResult::Done || !file_.Lock()) return false;
+    locked_ = file_.IsStill(path);
+    if (locked_) return true;
+  }
+  return false;
+}
+
+bool RenameLog::LockForUndo() { return DataFile(kLogName).empty() || LockFile(false); }
+
+// A log that takes the place of one that was shortened meanwhile goes on with what is left of that.
+bool RenameLog::Begin(bool fresh) {
+  const std::string path = DataFile(kLogName);
+  if (path.empty() || !platform::MakeFolders(std::string(platform::SplitPath(path).folder)) || !LockFile(true)) return false;
+  if (fresh && !file_.InUseByOthers() && !file_.Resize(0)) return false;
+  (void)file_.MarkInUse();  // without it two runs at once cannot both be taken back
+  return !number_ || Append({{}, std::to_string(*number_)});
+}
+
+bool RenameLog::Append(const RenamedFile& file) {
   const std::string record = RecordOf(file);
-  failed_ = !file_.WriteAt(size_, {reinterpret_cast<const uint8_t*>(record.data()), record.size()});
-  size_ += record.size();
+  before_ = file_.Size();
+  return file_.WriteAt(before_, {reinterpret_cast<const uint8_t*>(record.data()), record.size()});
+}
+
+bool RenameLog::Intend(const RenamedFile& file) {
+  if (failed_) return false;
+  if (!file_.IsOpen()) {
+    failed_ = !Begin(true);
+  } else {
+    locked_ = file_.Lock();
+    failed_ = !locked_;
+    if (locked_ && !file_.IsStill(DataFile(kLogName))) failed_ = !Begin(false);  // what it held was taken back
+  }
+  failed_ = failed_ || !Append(file);
+  if (failed_) file_.Close();
   return !failed_;
 }
 
-std::optional<std::vector<RenamedFile>> ReadRenameLog() {
-  const std::string path = DataFile(kLogName);
-  std::string text;
-  std::vector<RenamedFile> files;
-  if (path.empty()) return files;
-  const platform::ReadResult result = platform::ReadWholeFile(path, kLongestLog, text);
-  if (result == platform::ReadResult::Missing) return files;
-  if (result != platform::ReadResult::Done) return std::nullopt;
-  std::string_view contents = text;
-  for (RenamedFile file; TakeText(contents, file.from) && TakeText(contents, file.to);) files.push_back(file);
-  return files;
+void RenameLog::Settle(bool renamed) {
+  if (failed_ || !locked_) return;
+  if (!renamed) failed_ = !file_.Resize(before_);
+  file_.Unlock();
+  locked_ = false;
 }
 
-bool WriteRenameLog(std::span<const RenamedFile> files) {
+std::optional<RenameHistory> ReadRenameLog() {
   const std::string path = DataFile(kLogName);
-  if (files.empty()) return !platform::FileExists(path) || platform::DeleteFile(path);
-  std::string contents;
-  for (const RenamedFile& file : files) contents += RecordOf(file);
-  return platform::WriteWholeFile(path, contents);
+  std::string text;
+  if (path.empty()) return RenameHistory();
+  const platform::ReadResult result = platform::ReadWholeFile(path, kLongestLog, text);
+  if (result == platform::ReadResult::Missing) return RenameHistory();
+  if (result != platform::ReadResult::Done) return std::nullopt;
+  return Parsed(text);
+}
+
+bool WriteRenameLog(const RenameHistory& history) {
+  const std::string path = DataFile(kLogName);
+  if (history.files.empty()) return !platform::FileExists(path) || platform::DeleteFile(path);
+  return platform::WriteWholeFile(path, ContentsOf(history));
 }
 
 }  // namespace fotomill

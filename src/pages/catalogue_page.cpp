@@ -13,11 +13,13 @@
 #include "core/workers/ordered_run.h"
 #include "metadata/exif/picture_exif.h"
 #include "platform/clock.h"
+#include "platform/existence.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
 #include "platform/process.h"
 #include "processing/palette/reduce.h"
+#include "texts/system_reason.h"
 #include "texts/texts.h"
 
 namespace fotomill {
@@ -30,14 +32,18 @@ constexpr int32_t kPageDigits = 5;
 constexpr size_t kCellsAhead = 64;
 constexpr uint64_t kBytesAhead = uint64_t{64} << 20;
 
-// The path of the next page that nobody has; false when the numbers are used up.
-bool NextPageName(BatchJob& job, std::string& path) {
+// The path of the next page that nobody has. ErrorWritingFile if the numbers are used up, ErrorCreatingFile if the system
+// cannot tell.
+Status NextPageName(BatchJob& job, std::string& path) {
+  platform::Existence existence;
   do {
-    if (++job.cataloguePage >= kLastCataloguePage) return false;
+    if (++job.cataloguePage >= kLastCataloguePage) return Status::ErrorWritingFile;
     path = platform::JoinFolder(job.destinationFolder,
                                 CataloguePageName(job.naming.PrefixOf(FileFunction::Catalog), job.cataloguePage, ExtensionOfFormat(job)));
-  } while (platform::FileExists(path));
-  return true;
+    existence = platform::ExistenceOf(path);
+    if (existence == platform::Existence::Unknown) return Status::ErrorCreatingFile;
+  } while (existence == platform::Existence::Yes);
+  return Status::Ok;
 }
 
 Status WritePage(PictureRecord& page, const CataloguePageOptions& options, const Destination& destination, BatchJob& job) {
@@ -156,7 +162,8 @@ class ContactSheet {
           if (noName) outcome.destination.clear();
         }
         if (status == Status::TooManyColors) outcome.hint = options_.reduceHint;
-        if (status == Status::ErrorCreatingFile) outcome.hint = Tr("\"%1\" cannot be created.", path);
+        if (status == Status::ErrorCreatingFile) outcome.hint = WithReason(Tr("\"%1\" cannot be created.", path));
+        if (status == Status::ErrorWritingFile) outcome.hint = ReasonSentence();
       }
       ReportOutcome(job_, outcome, reported_++, static_cast<uint32_t>(files_.size()));
     }
@@ -199,18 +206,22 @@ std::string CataloguePageName(std::string_view prefix, uint32_t number, std::str
 }
 
 Status WriteCataloguePage(PictureRecord& page, const CataloguePageOptions& options, BatchJob& job, std::string& path) {
-  const TakenTest taken = [](const std::string& candidate) { return platform::FileExists(candidate); };
+  const TakenTest taken = platform::ExistenceOf;
   const VariantMaker variant = [&](std::string& candidate) {
-    return MakeNumberedVariant(candidate, job.naming.firstVariant, job.naming.lastVariant, taken);
+    return MakeNumberedVariant(candidate, job.naming.firstVariant, job.naming.lastVariant, taken, job.stop.Token());
   };
   for (int attempt = 0; attempt < kMostLostRaces; ++attempt) {
     std::string name;
-    if (!NextPageName(job, name)) return Status::ErrorWritingFile;
+    const Status named = NextPageName(job, name);
+    path = name;
+    RETURN_IF_BAD(named);
     Destination destination;
-    path = destination.path = name;
+    destination.path = name;
     if (path.size() > PathText::Capacity()) return Status::InvalidDestination;
     const DestinationAnswer answer = MakeDestinationName(destination, name, TrLater("Catalogue page"), job, taken, variant, &page);
-    if (destination.noVariant) ++job.writeAborts;
+    if (destination.search == VariantSearch::GivenUp) return Status::InvalidDestination;
+    if (destination.search == VariantSearch::Unknown) return Status::ErrorCreatingFile;
+    if (destination.search == VariantSearch::AllTaken) ++job.writeAborts;
     if (answer == DestinationAnswer::Skip) return Status::FunctionCancelled;
     path = destination.path;
     const FormatEntry& row = FormatRow(job.formatIndex);

@@ -33,10 +33,17 @@ class StoreFile {
   [[nodiscard]] bool ReadAt(uint64_t offset, std::span<uint8_t> first, std::span<uint8_t> second) const;
   [[nodiscard]] bool WriteAt(uint64_t offset, std::span<const uint8_t> first, std::span<const uint8_t> second);
   [[nodiscard]] bool Sync();
+  // Cuts the file to that size, or makes it longer with zeros.
+  [[nodiscard]] bool Resize(uint64_t size);
   // Waits for the exclusive lock on the file, which two StoreFiles never hold together, in one process or in two. Advisory
-  // between programs that ask for it. False when it cannot be had, or when the program was asked to end meanwhile.
+  // between programs that ask for it. False when it cannot be had, when the program was asked to end meanwhile, and after ten
+  // seconds; only then a reason is kept, which names the holder.
   [[nodiscard]] bool Lock();
   void Unlock();
+  // Says until Close that the file is in use, which any number of StoreFiles may; and whether others say so. Apart from Lock.
+  // Where locks do not work nothing is in use.
+  bool MarkInUse();
+  bool InUseByOthers() const;
   // Whether `path` still names this very file; after waiting for a lock another process may have replaced it.
   bool IsStill(const std::string& path) const;
   // The same with its size and time, all in one question to the system.

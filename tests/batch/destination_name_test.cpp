@@ -40,14 +40,55 @@ std::string Settle(BatchJob& job, const std::set<std::string>& there, const std:
   job.formatIndex = RowOf("tif");
   Destination destination;
   destination.path = PlannedDestination(source, {}, {}, job);
-  const TakenTest taken = [&](const std::string& path) { return there.contains(path); };
+  using platform::Existence;
+  const TakenTest taken = [&](const std::string& path) {
+    return path.starts_with("unknown") ? Existence::Unknown : there.contains(path) ? Existence::Yes : Existence::No;
+  };
   const VariantMaker variant = [&](std::string& path) {
     return MakeNumberedVariant(path, job.naming.firstVariant, job.naming.lastVariant, taken);
   };
   if (MakeDestinationName(destination, source, {}, job, taken, variant) == DestinationAnswer::Skip) {
-    return destination.noVariant ? "no variant" : "skipped";
+    FileOutcome outcome;
+    if (destination.search != VariantSearch::Found) SayNoName(destination, outcome);
+    return destination.search == VariantSearch::AllTaken ? "no variant"
+           : outcome.status == Status::Ok                 ? "skipped"
+                                                          : std::string(StatusMessage(outcome.status));
   }
   return (destination.replace ? destination.recycle ? "!~" : "!" : "") + destination.path;
+}
+
+// A name that nobody can tell about is neither free nor taken, and no search goes on forever.
+TEST(DestinationName, SearchesForNamesEnd) {
+  BatchJob job;
+  EXPECT_EQ(Settle(job, {}, "unknown.bmp"), "Error creating file.");
+  EXPECT_EQ(Settle(job, {"a.tif"}, "a.bmp"), "a [1].tif");
+  const TakenTest allTaken = [](const std::string&) { return platform::Existence::Yes; };
+  const TakenTest unknown = [](const std::string&) { return platform::Existence::Unknown; };
+  const StopSource stopped;
+  stopped.Stop();
+  const struct {
+    const char* name;
+    const TakenTest& taken;
+    int64_t last;
+    StopToken stop;
+    VariantSearch search;
+  } rows[] = {
+      {"range used up", allTaken, 5, {}, VariantSearch::AllTaken},
+      {"too many", allTaken, INT32_MAX, {}, VariantSearch::GivenUp},
+      {"nobody can tell", unknown, INT32_MAX, {}, VariantSearch::Unknown},
+      {"stopped", allTaken, INT32_MAX, stopped.Token(), VariantSearch::Stopped},
+  };
+  for (const auto& row : rows) {
+    std::string path = "a.tif";
+    EXPECT_EQ(MakeNumberedVariant(path, 1, row.last, row.taken, row.stop), row.search) << row.name;
+    EXPECT_EQ(path, "a.tif");
+  }
+  FileOutcome outcome;
+  Destination destination;
+  destination.search = VariantSearch::GivenUp;
+  SayNoName(destination, outcome);
+  EXPECT_EQ(outcome.status, Status::InvalidDestination);
+  EXPECT_FALSE(outcome.skipped);
 }
 
 TEST(DestinationName, ExtensionsFollowTheSourcesCase) {

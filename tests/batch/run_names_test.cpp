@@ -48,13 +48,13 @@ TEST(RunNames, AreTakenUntilTheyAreGivenBack) {
   names.AddPlanned("/out/a.pcx");
   EXPECT_TRUE(names.TakenByRun("/x/a.bmp", "/x/b.bmp"));
   EXPECT_FALSE(names.TakenByRun("/x/a.bmp", "/x/a.bmp")) << "its own source";
-  EXPECT_FALSE(names.Taken("/out/a.pcx", "/x/a.bmp"));
+  EXPECT_EQ(names.Taken("/out/a.pcx", "/x/a.bmp"), platform::Existence::No);
   names.Give("/out/a.pcx");
-  EXPECT_TRUE(names.Taken("/out/b/../a.pcx", "/x/a.bmp"));
+  EXPECT_EQ(names.Taken("/out/b/../a.pcx", "/x/a.bmp"), platform::Existence::Yes);
   names.TakeBack("/out/a.pcx");
-  EXPECT_FALSE(names.Taken("/out/a.pcx", "/x/a.bmp"));
+  EXPECT_EQ(names.Taken("/out/a.pcx", "/x/a.bmp"), platform::Existence::No);
   EXPECT_FALSE(names.TakenByRun(folder.Path("there"), "/x/a.bmp"));
-  EXPECT_TRUE(names.Taken(folder.Path("there"), "/x/a.bmp"));
+  EXPECT_EQ(names.Taken(folder.Path("there"), "/x/a.bmp"), platform::Existence::Yes);
 }
 
 }  // namespace

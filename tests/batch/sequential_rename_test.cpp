@@ -177,7 +177,79 @@ TEST_F(Rename, TakenBack) {
   ASSERT_TRUE(UndoRename({}, false, undo));  // what could not be taken back is still known
   EXPECT_FALSE(undo.errors);
   EXPECT_THAT(There(), ElementsAre("a.jpg=a.jpg", "b.jpg=b.jpg", "c.jpg=c.jpg"));
-  EXPECT_TRUE(ReadRenameLog()->empty());
+  EXPECT_TRUE(ReadRenameLog()->files.empty());
+}
+
+// A rename is noted before it is done: a run that is killed in between has either lost nothing or not begun.
+TEST_F(Rename, KilledRunsCanBeTakenBack) {
+  Make({"a.jpg", "b.jpg"});
+  const std::string a = folder_.Path("p/a.jpg"), b = folder_.Path("p/b.jpg");
+  {
+    RenameLog killed;
+    ASSERT_TRUE(killed.Intend({a, folder_.Path("p/1.jpg")}));
+    std::filesystem::rename(a, folder_.Path("p/1.jpg"));
+    killed.Settle(true);
+    ASSERT_TRUE(killed.Intend({b, folder_.Path("p/2.jpg")}));
+    std::filesystem::rename(b, folder_.Path("p/2.jpg"));  // and no more
+  }
+  BatchJob undo;
+  ASSERT_TRUE(UndoRename({}, false, undo));
+  EXPECT_FALSE(undo.errors);
+  EXPECT_THAT(There(), ElementsAre("a.jpg=a.jpg", "b.jpg=b.jpg"));
+  {
+    RenameLog killed;
+    ASSERT_TRUE(killed.Intend({a, folder_.Path("p/1.jpg")}));
+    killed.Settle(false);
+    ASSERT_TRUE(killed.Intend({b, folder_.Path("p/2.jpg")}));
+  }
+  EXPECT_EQ(ReadRenameLog()->files.size(), 1u);
+  BatchJob nothing;
+  ASSERT_TRUE(UndoRename({}, false, nothing));
+  EXPECT_FALSE(nothing.errors);
+  EXPECT_THAT(There(), ElementsAre("a.jpg=a.jpg", "b.jpg=b.jpg"));
+}
+
+TEST_F(Rename, RunsAtTheSameTimeAreBothTakenBack) {
+  Make({"a.jpg", "b.jpg"});
+  const auto rename = [&](RenameLog& log, const std::string& from, const std::string& to) {
+    ASSERT_TRUE(log.Intend({folder_.Path(from), folder_.Path(to)}));
+    std::filesystem::rename(folder_.Path(from), folder_.Path(to));
+    log.Settle(true);
+  };
+  {
+    RenameLog first;
+    rename(first, "p/a.jpg", "p/1.jpg");
+    RenameLog second;
+    rename(second, "p/b.jpg", "p/a.jpg");
+    rename(first, "p/1.jpg", "p/b.jpg");
+    rename(second, "p/a.jpg", "p/2.jpg");
+  }
+  EXPECT_THAT(There(), ElementsAre("2.jpg=b.jpg", "b.jpg=a.jpg"));
+  BatchJob undo;
+  ASSERT_TRUE(UndoRename({}, false, undo));
+  EXPECT_FALSE(undo.errors);
+  EXPECT_THAT(There(), ElementsAre("a.jpg=a.jpg", "b.jpg=b.jpg"));
+  // A run after them begins a new log; one that goes on while part of it is taken back loses nothing.
+  RenameLog third;
+  rename(third, "p/a.jpg", "p/1.jpg");
+  rename(third, "p/b.jpg", "p/2.jpg");
+  ASSERT_TRUE(UndoRename({folder_.Path("p/2.jpg")}, false, undo));
+  rename(third, "p/b.jpg", "p/3.jpg");
+  EXPECT_EQ(ReadRenameLog()->files.size(), 2u);
+  ASSERT_TRUE(UndoRename({}, false, undo));
+  EXPECT_THAT(There(), ElementsAre("a.jpg=a.jpg", "b.jpg=b.jpg"));
+}
+
+TEST_F(Rename, UndoGivesTheNumbersBack) {
+  Make({"a.jpg", "b.jpg"});
+  settings.SequentialRenameBaseNumber = 7;
+  RunAsSet({"a.jpg", "b.jpg"});
+  EXPECT_EQ(settings.SequentialRenameBaseNumber, 9u);
+  BatchJob undo = NewBatchJob();
+  ASSERT_TRUE(UndoRename({folder_.Path("p/PICTURE0008.jpg")}, false, undo));
+  EXPECT_EQ(settings.SequentialRenameBaseNumber, 9u) << "one file is still counted";
+  ASSERT_TRUE(UndoRename({}, false, undo));
+  EXPECT_EQ(settings.SequentialRenameBaseNumber, 7u);
 }
 
 TEST_F(Rename, RandomOrderIsThatOfItsSeed) {

@@ -145,8 +145,8 @@ TEST(Turn, WhateverFailsTheOldFileIsThere) {
   const TemporaryFolder folder;
   const std::string path = folder.Path("a.jpg");
   const std::vector<uint8_t> file = Encode(JpegWrite, *PatternPicture(32, 16, 24));
-  WriteBytes(path, file);
   const int64_t faults = ForEachFault([&] {
+    WriteBytes(path, file);
     const Status status = TurnPictureFile(path, path, {.turn = Orientation::HalfTurn}, {}, {}).status;
     EXPECT_EQ(ReadBytes(path) == file, status != Status::Ok);
     EXPECT_EQ(folder.Names().size(), 1u);

@@ -147,10 +147,10 @@ TEST_F(FileCommands, UnreadableFilesAndFolders) {
   }
   fs::permissions(In("sub"), fs::perms::owner_all);
   EXPECT_EQ(info.status, 1);
-  EXPECT_TRUE(info.Says(In("a.bmp") + ": File open error.")) << info.err;
-  EXPECT_TRUE(info.Says(In("sub") + ": File open error. The folder cannot be read.")) << info.err;
+  EXPECT_TRUE(info.Says(In("a.bmp") + ": File open error. Permission denied.")) << info.err;
+  EXPECT_TRUE(info.Says(In("sub") + ": File open error. The folder cannot be read. Permission denied.")) << info.err;
   EXPECT_EQ(convert.status, 1);
-  EXPECT_THAT(convert.err, HasSubstr(": Error creating file. "));
+  EXPECT_THAT(convert.err, HasSubstr("b.PCX\" cannot be created. Permission denied."));
 }
 
 TEST_F(FileCommands, ClosingLines) {

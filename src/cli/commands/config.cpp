@@ -9,6 +9,7 @@
 #include "cli/frame/shown_text.h"
 #include "platform/files.h"
 #include "settings/configuration.h"
+#include "texts/system_reason.h"
 #include "texts/texts.h"
 
 namespace fotomill::cli {
@@ -116,7 +117,7 @@ int Change(const ConfigOptions& options, const CommandContext& context, const Ke
     StoreDefault(row);
   }
   if (const std::string message = Tr(SaveMessage(result)); !message.empty()) {
-    PrintProblem(context, message);
+    PrintProblem(context, WithReason(message));
     return kExitFailed;
   }
   ResultOutput output(context, options.json);

@@ -13,6 +13,7 @@
 #include "cli/frame/terminal_box.h"
 #include "cli/frame/terminal_prompts.h"
 #include "pages/catalogue_page.h"
+#include "platform/existence.h"
 #include "platform/files.h"
 #include "settings/settings.h"
 #include "texts/texts.h"
@@ -89,7 +90,7 @@ int RunSheet(const SheetOptions& options, const CommandContext& context) {
   sheet.upright = settings.ExifAdjustOrientation != 0;
   if (const std::string wrong = ReadDestinationFormat(options.to, job); !wrong.empty()) return UsageError(context, wrong);
   if (const std::string wrong = ReadLook(options, sheet.look); !wrong.empty()) return UsageError(context, wrong);
-  if (platform::FileExists(options.dest) && !platform::IsFolder(options.dest)) {
+  if (platform::ExistenceOf(options.dest) == platform::Existence::Yes && !platform::IsFolder(options.dest)) {
     return UsageError(context, Tr("\"%1\" is not a folder.", options.dest));
   }
   const auto files = SelectFiles(options.selection, context);

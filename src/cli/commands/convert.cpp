@@ -16,6 +16,7 @@
 #include "cli/frame/terminal_box.h"
 #include "cli/frame/terminal_prompts.h"
 #include "core/plain_name.h"
+#include "platform/existence.h"
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "settings/settings.h"
@@ -100,7 +101,7 @@ std::string CheckOptions(const ConvertOptions& options, const CommandContext& co
   if (!IsPlainName(prefix)) return Tr("The prefix must be part of a file name, not a path.");
   if (options.keepTree && options.dest.empty()) return Tr("--keep-tree needs --dest.");
   if (options.overwrite == "ask" && !context.MayAsk()) return Tr("--overwrite ask needs a terminal.");
-  if (!options.dest.empty() && platform::FileExists(options.dest) && !platform::IsFolder(options.dest)) {
+  if (!options.dest.empty() && platform::ExistenceOf(options.dest) == platform::Existence::Yes && !platform::IsFolder(options.dest)) {
     return Tr("\"%1\" is not a folder.", options.dest);
   }
   return {};

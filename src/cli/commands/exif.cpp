@@ -14,8 +14,10 @@
 #include "metadata/exif/exif_text.h"
 #include "metadata/gps.h"
 #include "platform/files.h"
+#include "platform/held_file.h"
 #include "platform/output_file.h"
 #include "settings/job_options.h"
+#include "texts/system_reason.h"
 #include "texts/texts.h"
 
 namespace fotomill::cli {
@@ -65,21 +67,23 @@ Outcome WriteThumbnail(std::span<const uint8_t> bytes, const ExifOptions& option
   const std::string taken = Tr("The file exists; use --overwrite replace to replace it.");
   if (!replace && platform::FileExists(path)) return {Status::ErrorCreatingFile, taken, path};
   platform::OutputFile file;
-  if (!file.Create(path)) return {Status::ErrorCreatingFile, {}, path};
-  if (!file.Write(bytes)) return {Status::ErrorWritingFile, {}, path};
+  platform::HeldFile held;
+  if (replace && !held.Hold(path)) return {Status::ErrorCreatingFile, ReasonSentence(), path};
+  if (!file.Create(path)) return {Status::ErrorCreatingFile, ReasonSentence(), path};
+  if (!file.Write(bytes)) return {Status::ErrorWritingFile, ReasonSentence(), path};
   switch (file.Commit(replace ? platform::Existing::Replace : platform::Existing::Refuse)) {
     case platform::CommitResult::Done: return {};
     case platform::CommitResult::Taken: return {Status::ErrorCreatingFile, taken, path};
     case platform::CommitResult::Failed: break;
   }
-  return {Status::ErrorWritingFile, {}, path};
+  return {Status::ErrorWritingFile, ReasonSentence(), path};
 }
 
 // Walks the EXIF of one file into `sink` and writes its thumbnail if asked to.
 Outcome WalkFile(const SelectedFile& file, const ExifOptions& options, ExifSink& sink) {
   if (file.status != Status::Ok) return {file.status, file.hint, {}};
   ExifSource source;
-  if (const Status status = source.Open(file.name.c_str()); status != Status::Ok) return {status, {}, {}};
+  if (const Status status = source.Open(file.name.c_str()); status != Status::Ok) return {status, ReasonSentence(), {}};
   const auto block = source.Block();
   ExifFindings findings;
   if (!block.empty() && !WalkExif(block, &sink, &findings)) {

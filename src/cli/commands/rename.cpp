@@ -12,6 +12,7 @@
 #include "cli/frame/result_output.h"
 #include "cli/frame/terminal_box.h"
 #include "platform/folders.h"
+#include "texts/system_reason.h"
 #include "texts/texts.h"
 
 namespace fotomill::cli {
@@ -31,7 +32,7 @@ int RunUndo(const RenameCommandOptions& options, const std::vector<SelectedFile>
   std::set<std::string> only;
   for (const SelectedFile& file : files) only.insert(platform::AbsolutePath(file.name));
   if (UndoRename(only, options.dryRun, job)) return kExitOk;
-  output.Message(std::string("fotomill: ") + Tr("The record of the last renaming in the data folder cannot be read."));
+  output.Message(std::string("fotomill: ") + WithReason(Tr("The record of the last renaming in the data folder cannot be read.")));
   return kExitFailed;
 }
 

@@ -18,6 +18,7 @@
 #include "platform/folders.h"
 #include "platform/process.h"
 #include "settings/job_options.h"
+#include "texts/system_reason.h"
 #include "texts/texts.h"
 
 namespace fotomill::cli {
@@ -46,7 +47,7 @@ bool OpenDatabase(ThumbnailDatabase& database, const std::string& path, bool cre
     case ThumbnailDatabase::Opened::Done: return true;
     case ThumbnailDatabase::Opened::Missing: output.Failure(path, Status::FileOpenError); break;
     case ThumbnailDatabase::Opened::NotRead: output.Failure(path, Status::DamagedFile, Tr(kNoDatabase)); break;
-    case ThumbnailDatabase::Opened::Failed: output.Failure(path, Status::ErrorCreatingFile); break;
+    case ThumbnailDatabase::Opened::Failed: output.Failure(path, Status::ErrorCreatingFile, ReasonSentence()); break;
   }
   return false;
 }
@@ -68,6 +69,7 @@ Adding MakeRecord(const SelectedFile& file, const ThumbnailOptions& options) {
     return adding;
   }
   adding.status = MakeThumbnailOfFile(file.name, options, adding.record->thumbnail);
+  if (adding.status != Status::Ok) adding.hint = OpenHint(file.name, adding.status);
   adding.record->volume = VolumeKeyFor(adding.record->path);
   return adding;
 }
@@ -80,7 +82,7 @@ class Appending {
   void Add(const SelectedFile& file, Adding& adding) {
     if (adding.status != Status::Ok) {
       Flush();
-      output_.Failure(file.name, adding.status, adding.hint.empty() ? OpenHint(file.name, adding.status) : adding.hint);
+      output_.Failure(file.name, adding.status, adding.hint);
       return;
     }
     names_.push_back(file.name);
@@ -178,7 +180,7 @@ int RunFind(const TdbOptions& options, CommandContext& context) {
     return output.Finish();
   }
   if (!WriteThumbnailFile(record, options.out, ThumbnailOptionsFromSettings().hidden)) {
-    output.Failure(options.out, Status::ErrorCreatingFile);
+    output.Failure(options.out, Status::ErrorCreatingFile, ReasonSentence());
     return output.Finish();
   }
   output.CountFile();

@@ -18,6 +18,7 @@
 #include "core/workers/guarded.h"
 #include "core/workers/ordered_run.h"
 #include "metadata/exif/picture_exif.h"
+#include "platform/existence.h"
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "platform/process.h"
@@ -26,6 +27,7 @@
 #include "registry/registry.h"
 #include "settings/job_options.h"
 #include "settings/settings.h"
+#include "texts/system_reason.h"
 #include "texts/texts.h"
 
 namespace fotomill::cli {
@@ -74,6 +76,7 @@ Status MakeThumbnail(const std::string& name, const ThumbnailOptions& options) {
 // A selected file and its result.
 struct Making {
   Status status = Status::Ok;
+  std::string hint = {};         // after the message of a failure
   bool wanted = false;           // it has no current thumbnail
   std::vector<size_t> together;  // for the first file that uses a thumbnail file: all wanted files that use it, in order
 };
@@ -83,6 +86,7 @@ std::vector<Making> PlanMaking(const std::vector<SelectedFile>& files, bool forc
   std::map<std::string, size_t> firsts;
   for (size_t i = 0; i < files.size(); ++i) {
     makings[i].status = files[i].status;
+    makings[i].hint = files[i].hint;
     makings[i].wanted = files[i].status == Status::Ok && (force || StateOf(files[i].name) != ThumbnailState::Current);
     if (makings[i].wanted) makings[firsts.try_emplace(ThumbnailPathFor(files[i].name), i).first->second].together.push_back(i);
   }
@@ -101,7 +105,7 @@ void ReportMaking(const SelectedFile& file, const Making& making, ResultOutput& 
     output.Element(element);
   }
   if (making.status != Status::Ok) {
-    output.Failure(file.name, making.status, file.hint.empty() ? OpenHint(file.name, making.status) : file.hint);
+    output.Failure(file.name, making.status, making.hint);
   } else if (!made) {
     output.Note(output.ShownMessage(file.name) + ": " + Tr("already has a current thumbnail."));
   } else {
@@ -126,7 +130,11 @@ int RunMake(const ThumbsOptions& options, const CommandContext& context) {
             if (options.dryRun) return Status::Ok;
             const FolderScope folder((*files)[item].name);
             for (const size_t i : makings[item].together) {
-              makings[i].status = Guarded([&] { return MakeThumbnail((*files)[i].name, thumbnails); });
+              Making& making = makings[i];
+              const std::string& name = (*files)[i].name;
+              making.status = Guarded([&] { return MakeThumbnail(name, thumbnails); });
+              if (making.status == Status::Ok) continue;
+              making.hint = making.status == Status::ErrorCreatingFile ? ReasonSentence() : OpenHint(name, making.status);
             }
             return Status::Ok;
           },
@@ -150,7 +158,7 @@ int WriteDrawing(PictureRecord& picture, const std::string& name, const ThumbsOp
   const Status status = WritePicture(picture, options.out, write);
   if (status != Status::Ok) {
     const bool taken = write.existing == platform::Existing::Refuse && platform::FileExists(options.out);
-    output.Failure(options.out, status, taken ? Tr("The file exists; use --overwrite replace to replace it.") : "");
+    output.Failure(options.out, status, taken ? Tr("The file exists; use --overwrite replace to replace it.") : ReasonSentence());
     return output.Finish();
   }
   output.CountFile();
@@ -211,7 +219,7 @@ std::optional<std::vector<std::string>> PicturesIn(const std::string& folder) {
 }
 
 int FailFolder(ResultOutput& output, const std::string& folder) {
-  output.Failure(folder, Status::FileOpenError, platform::FileExists(folder) ? Tr("Not a readable folder.") : "");
+  output.Failure(folder, Status::FileOpenError, platform::FileExists(folder) ? WithReason(Tr("Not a readable folder.")) : "");
   return output.Finish();
 }
 
@@ -247,7 +255,8 @@ int RunClean(const ThumbsOptions& options, const CommandContext& context) {
   for (const std::string& orphan : *orphans) {
     if (!output.GoesOn()) break;
     if (!options.dryRun && (optical || !platform::DeleteFile(orphan))) {
-      output.Failure(orphan, Status::ErrorWritingFile, Tr("It could not be deleted."));
+      if (platform::ExistenceOf(orphan) == platform::Existence::No) continue;  // another run was faster
+      output.Failure(orphan, Status::ErrorWritingFile, WithReason(Tr("It could not be deleted.")));
       continue;
     }
     output.CountFile();

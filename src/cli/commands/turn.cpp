@@ -10,6 +10,7 @@
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
 #include "cli/frame/terminal_box.h"
+#include "platform/existence.h"
 #include "platform/files.h"
 #include "settings/settings.h"
 #include "texts/texts.h"
@@ -55,7 +56,7 @@ std::string CheckOptions(const TurnOptions& options) {
   }
   if (!options.inPlace && options.dest.empty()) return Tr("Choose --dest DIR or --in-place.");
   if (options.keepTree && options.dest.empty()) return Tr("--keep-tree needs --dest.");
-  if (!options.dest.empty() && platform::FileExists(options.dest) && !platform::IsFolder(options.dest)) {
+  if (!options.dest.empty() && platform::ExistenceOf(options.dest) == platform::Existence::Yes && !platform::IsFolder(options.dest)) {
     return Tr("\"%1\" is not a folder.", options.dest);
   }
   return {};

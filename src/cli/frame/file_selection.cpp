@@ -8,6 +8,7 @@
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "registry/registry.h"
+#include "texts/system_reason.h"
 #include "texts/texts.h"
 
 namespace fotomill::cli {
@@ -58,7 +59,7 @@ class Selector {
   void AddFolder(const std::string& folder, const std::string& below, int depth) {
     const auto entries = platform::ListFolder(folder);
     if (!entries) {
-      files_.push_back({folder, below, Status::FileOpenError, Tr("The folder cannot be read.")});
+      files_.push_back({folder, below, Status::FileOpenError, WithReason(Tr("The folder cannot be read."))});
       return;
     }
     for (const platform::FolderEntry& entry : *entries) {

@@ -31,7 +31,7 @@ bool IsPlain(std::string_view text) {
 }
 
 char* Put(char* place, std::string_view text) {
-  std::memcpy(place, text.data(), text.size());
+  if (!text.empty()) std::memcpy(place, text.data(), text.size());
   return place + text.size();
 }
 

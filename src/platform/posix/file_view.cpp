@@ -14,6 +14,8 @@
 
 #include "platform/fault.h"
 #include "platform/posix/handle.h"
+#include "platform/posix/kept_reason.h"
+#include "platform/reason.h"
 
 namespace fotomill::platform {
 
@@ -105,6 +107,7 @@ bool FileView::OpenHead(const char* path, uint64_t count) { return OpenPart(path
 
 bool FileView::OpenPart(const char* path, uint64_t most) {
   Close();
+  ForgetReason();
   if (FaultDue()) return false;
   struct stat facts;
   handle_ = OpenRegular(path, O_RDONLY, facts).Release();
@@ -115,6 +118,7 @@ bool FileView::OpenPart(const char* path, uint64_t most) {
   const int64_t count =
       FaultDue() || !copy_.Allocate(size_, Fill::Unset) ? -1 : ReadFully(static_cast<int>(handle_), copy_.Data(), size_, 0);
   if (count < 0) {
+    KeepErrno();
     Close();
     return false;
   }

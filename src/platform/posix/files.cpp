@@ -13,9 +13,12 @@
 #include <new>
 #include <stdexcept>
 
+#include "platform/existence.h"
 #include "platform/fault.h"
 #include "platform/paths.h"
 #include "platform/posix/handle.h"
+#include "platform/posix/kept_reason.h"
+#include "platform/reason.h"
 
 namespace fotomill::platform {
 
@@ -91,6 +94,14 @@ FileFacts FactsOf(const std::string& path) {
   return facts;
 }
 
+Existence ExistenceOf(const std::string& path) {
+  struct stat facts;
+  if (lstat(path.c_str(), &facts) == 0) return Existence::Yes;
+  if (NothingThere()) return Existence::No;
+  KeepErrno();
+  return Existence::Unknown;
+}
+
 bool FileExists(const std::string& path) {
   struct stat facts;
   return lstat(path.c_str(), &facts) == 0 || !NothingThere();
@@ -107,9 +118,13 @@ bool IsFolder(const std::string& path) {
 }
 
 std::optional<std::vector<FolderEntry>> ListFolder(const std::string& path) {
+  ForgetReason();
   if (FaultDue()) return std::nullopt;
   const std::unique_ptr<DIR, int (*)(DIR*)> folder(opendir(path.c_str()), closedir);
-  if (folder == nullptr) return std::nullopt;
+  if (folder == nullptr) {
+    KeepErrno();
+    return std::nullopt;
+  }
   std::vector<FolderEntry> entries;
   for (;;) {
     errno = FaultDue() ? EIO : 0;
@@ -126,30 +141,46 @@ std::optional<std::vector<FolderEntry>> ListFolder(const std::string& path) {
 }
 
 bool MakeFolders(const std::string& path) {
+  ForgetReason();
   if (IsFolder(path)) return true;
   if (path.empty() || FaultDue()) return false;
   for (size_t end = path.find('/', 1);; end = path.find('/', end + 1)) {
     const std::string part = path.substr(0, end);
-    if (mkdir(part.c_str(), 0777) != 0 && errno != EEXIST && !IsFolder(part)) return false;
+    if (mkdir(part.c_str(), 0777) != 0 && errno != EEXIST) {
+      KeepErrno();
+      if (!IsFolder(part)) return false;
+    }
     if (end == std::string::npos) break;
   }
-  return IsFolder(path);
+  if (!IsFolder(path)) return false;
+  ForgetReason();
+  return true;
 }
 
 bool DeleteFile(const std::string& path) {
   struct stat facts;
-  if (lstat(path.c_str(), &facts) != 0 || S_ISDIR(facts.st_mode) || FaultDue()) return false;
-  return unlink(path.c_str()) == 0;
+  ForgetReason();
+  if (lstat(path.c_str(), &facts) == 0 && (S_ISDIR(facts.st_mode) || FaultDue())) return false;
+  if (unlink(path.c_str()) == 0) return true;
+  KeepErrno();
+  return false;
 }
 
 bool DeleteFolder(const std::string& path) { return !FaultDue() && rmdir(path.c_str()) == 0; }
 
 CommitResult RenameFile(const std::string& from, const std::string& to, Existing existing) {
+  ForgetReason();
   if (FaultDue()) return CommitResult::Failed;
-  if (existing == Existing::Refuse) return RenameRefusing(from, to);
-  struct stat facts;
-  if (lstat(to.c_str(), &facts) == 0 && !S_ISREG(facts.st_mode) && !S_ISLNK(facts.st_mode)) return CommitResult::Failed;
-  return std::rename(from.c_str(), to.c_str()) == 0 ? CommitResult::Done : CommitResult::Failed;
+  CommitResult result = CommitResult::Failed;
+  if (existing == Existing::Refuse) {
+    result = RenameRefusing(from, to);
+  } else {
+    struct stat facts;
+    if (lstat(to.c_str(), &facts) == 0 && !S_ISREG(facts.st_mode) && !S_ISLNK(facts.st_mode)) return CommitResult::Failed;
+    if (std::rename(from.c_str(), to.c_str()) == 0) result = CommitResult::Done;
+  }
+  if (result == CommitResult::Failed) KeepErrno();
+  return result;
 }
 
 bool SetHidden(const std::string& path, bool) { return FileExists(path); }

@@ -8,6 +8,7 @@
 #include <cstdio>
 
 #include "platform/paths.h"
+#include "platform/posix/kept_reason.h"
 
 namespace fotomill::platform {
 
@@ -64,10 +65,14 @@ Handle OpenHandle(const char* path, int flags, mode_t mode) {
 
 Handle OpenRegular(const char* path, int flags, struct stat& facts) {
   Handle handle = OpenHandle(path, flags | O_NONBLOCK | O_NOCTTY);
-  if (!handle.IsOpen() || fstat(handle.Number(), &facts) != 0) return Handle();
+  if (!handle.IsOpen() || fstat(handle.Number(), &facts) != 0) {
+    KeepErrno();
+    return Handle();
+  }
   if (S_ISREG(facts.st_mode)) return handle;
   handle.Reset();
   errno = S_ISDIR(facts.st_mode) ? EISDIR : EINVAL;
+  KeepErrno();
   return Handle();
 }
 

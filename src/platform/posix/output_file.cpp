@@ -1,6 +1,7 @@
 #include "platform/output_file.h"
 
 #include <fcntl.h>
+#include <sys/file.h>
 #include <sys/sendfile.h>
 #include <sys/stat.h>
 #include <unistd.h>
@@ -9,13 +10,19 @@
 #include <atomic>
 #include <cerrno>
 #include <cstdio>
+#include <string_view>
 #include <utility>
 
 #include "platform/fault.h"
 #include "platform/files.h"
 #include "platform/paths.h"
+#include "platform/posix/attributes.h"
+#include "platform/posix/exchange.h"
 #include "platform/posix/handle.h"
+#include "platform/posix/kept_reason.h"
+#include "platform/posix/stale_files.h"
 #include "platform/posix/temporary_names.h"
+#include "platform/reason.h"
 
 namespace fotomill::platform {
 
@@ -31,11 +38,11 @@ std::string FolderOf(const std::string& path) {
   return folder.empty() ? "." : folder;
 }
 
-// ".fmw-PID-N.tmp" beside the destination: hidden, short, and unique within this machine and process.
+// ".fmw-OWNER-N.tmp" beside the destination: hidden, short, and unique within this machine and process.
 std::string TemporarySibling(const std::string& path) {
   static std::atomic<unsigned> counter{0};
   char name[64];
-  std::snprintf(name, sizeof name, ".fmw-%ld-%u.tmp", static_cast<long>(getpid()), ++counter);
+  std::snprintf(name, sizeof name, ".fmw-%s-%x.tmp", OwnerOfTemporary().c_str(), ++counter);
   return JoinFolder(SplitPath(path).folder, name);
 }
 
@@ -63,34 +70,63 @@ bool CloseCopyOf(int handle) {
   return copy.IsOpen() && copy.Reset();
 }
 
-// Whether `path` may become a file: free, a link, or a regular file that may be written to, whose permissions then go to
-// `mode` with `keepMode` set.
-bool MayBecome(const std::string& path, mode_t& mode, bool& keepMode) {
+// Whether a link may be replaced: one to a regular file, or to nothing. Others are the system's or stand for a place, and so do
+// those that name an open file, as /dev/stdout does.
+bool MayReplaceLink(const std::string& path) {
+  constexpr std::string_view kOpenFiles = "/proc/";
+  char target[kOpenFiles.size()];
+  const ssize_t count = readlink(path.c_str(), target, sizeof target);
+  struct stat facts;
+  const bool replaceable = count >= 0 && std::string_view(target, static_cast<size_t>(count)) != kOpenFiles &&
+                           (stat(path.c_str(), &facts) != 0 || S_ISREG(facts.st_mode));
+  if (!replaceable) errno = EINVAL;
+  return replaceable;
+}
+
+// Whether `path` may become a file: free, a link that may be replaced, or a regular file that may be written to, whose
+// permissions then go to `mode`. False with errno.
+bool MayBecome(const std::string& path, mode_t& mode) {
   struct stat facts;
   if (lstat(path.c_str(), &facts) != 0) return errno == ENOENT;
-  if (S_ISLNK(facts.st_mode)) return true;
-  if (!S_ISREG(facts.st_mode) || faccessat(AT_FDCWD, path.c_str(), W_OK, AT_EACCESS) != 0) return false;
+  if (S_ISLNK(facts.st_mode)) return MayReplaceLink(path);
+  if (!S_ISREG(facts.st_mode)) {
+    errno = EINVAL;
+    return false;
+  }
   mode = facts.st_mode & 0777;
-  keepMode = true;
-  return true;
+  return faccessat(AT_FDCWD, path.c_str(), W_OK, AT_EACCESS) == 0;
+}
+
+CommitResult SayChanged(const std::string& path) {
+  HeldFile::SetChanged(path);
+  KeepReason("The file was changed by another program");
+  return CommitResult::Failed;
 }
 
 }  // namespace
 
 bool OutputFile::Create(const std::string& path) {
   Discard();
+  ForgetReason();
+  errno = 0;
   mode_t mode = 0666;
-  bool keepMode = false;
-  if (path.empty() || FileNameOf(path).empty() || !MayBecome(path, mode, keepMode) || FaultDue()) return false;
+  if (path.empty() || FileNameOf(path).empty() || !MayBecome(path, mode) || FaultDue()) {
+    KeepErrno();
+    return false;
+  }
   path_ = path;
   failed_ = false;
   handle_ = OpenUnnamed(FolderOf(path), mode).Release();
-  if (handle_ < 0 && !CreateNamedSibling(mode)) return false;
-  if (keepMode) fchmod(handle_, mode);  // without the user's mask; where that fails it has fewer, never more
+  if (handle_ < 0 && !CreateNamedSibling(mode)) {
+    KeepErrno();
+    return false;
+  }
+  flock(handle_, LOCK_EX | LOCK_NB);  // tells other runs that its name is not a killed one's
   return true;
 }
 
 bool OutputFile::CreateNamedSibling(unsigned mode) {
+  DeleteStaleFiles(FolderOf(path_));
   for (int attempt = 0; attempt < kAttempts; ++attempt) {
     std::string name = TemporarySibling(path_);
     const int handle = OpenHandle(name.c_str(), O_RDWR | O_CREAT | O_EXCL | O_NOFOLLOW, mode).Release();
@@ -108,6 +144,7 @@ bool OutputFile::CreateNamedSibling(unsigned mode) {
 bool OutputFile::Write(std::span<const uint8_t> bytes) {
   if (failed_ || handle_ < 0) return false;
   failed_ = FaultDue() || !WriteFully(handle_, bytes.data(), bytes.size());
+  if (failed_) KeepErrno();
   return !failed_;
 }
 
@@ -115,19 +152,29 @@ bool OutputFile::WriteAt(uint64_t offset, std::span<const uint8_t> bytes) {
   if (failed_ || handle_ < 0) return false;
   failed_ = offset > INT64_MAX - bytes.size() || FaultDue() ||
             !WriteFully(handle_, bytes.data(), bytes.size(), static_cast<int64_t>(offset));
+  if (failed_) KeepErrno();
   return !failed_;
 }
 
 CommitResult OutputFile::Commit(Existing existing, bool sync) {
   if (handle_ < 0) return CommitResult::Failed;
+  if (!failed_) ForgetReason();
+  KeepLostAttributes({});
   struct stat facts;
   const bool there = lstat(path_.c_str(), &facts) == 0;
   const bool replaces = existing == Existing::Replace && there;
-  failed_ = failed_ || (replaces && !S_ISREG(facts.st_mode) && !S_ISLNK(facts.st_mode));
+  failed_ = failed_ || (replaces && !S_ISREG(facts.st_mode) && !(S_ISLNK(facts.st_mode) && MayReplaceLink(path_)));
+  if (replaces && !failed_ && S_ISREG(facts.st_mode)) KeepLostAttributes(CopyAttributes(path_, facts, handle_));
   bool synced = sync || replaces;
-  if (synced && !failed_) failed_ = FaultDue() || !SyncHandle(handle_);
+  if (synced && !failed_) {
+    failed_ = FaultDue() || !SyncHandle(handle_);
+    if (failed_) KeepErrno();
+  }
   CommitResult result = CommitResult::Failed;
-  if (!failed_ && CloseCopyOf(handle_) && !FaultDue()) result = TakeName(existing, replaces, synced);
+  if (!failed_ && CloseCopyOf(handle_) && !FaultDue()) {
+    result = TakeName(existing, replaces, synced);
+    if (result == CommitResult::Failed && SystemReason().empty()) KeepErrno();
+  }
   if (result == CommitResult::Done) temporary_.clear();
   Discard();
   if (result == CommitResult::Done && synced) SyncFolderOf(path_);
@@ -136,6 +183,9 @@ CommitResult OutputFile::Commit(Existing existing, bool sync) {
 
 // Makes the sibling the file. `synced` is set when that turned out to need it.
 CommitResult OutputFile::TakeName(Existing existing, bool replaces, bool& synced) {
+  FileStamp expected;
+  const bool held = existing == Existing::Replace && HeldFile::Find(path_, expected);
+  if (held && !(StampOf(path_) == expected)) return SayChanged(path_);
   if (temporary_.empty() && !replaces) {
     if (NameUnnamed(handle_, path_)) return CommitResult::Done;
     if (errno == EEXIST && existing == Existing::Refuse) return CommitResult::Taken;
@@ -147,12 +197,21 @@ CommitResult OutputFile::TakeName(Existing existing, bool replaces, bool& synced
     if (FaultDue() || !SyncHandle(handle_)) return CommitResult::Failed;
   }
   if (FaultDue()) return CommitResult::Failed;
-  return std::rename(temporary_.c_str(), path_.c_str()) == 0 ? CommitResult::Done : CommitResult::Failed;
+  if (!held) {
+    return std::rename(temporary_.c_str(), path_.c_str()) == 0 ? CommitResult::Done : CommitResult::Failed;
+  }
+  LeaveTemporaryName(listed_);  // it may soon be the name of what another program has written
+  listed_ = -1;
+  bool keep = false;
+  const CommitResult result = ReplaceExpected(temporary_, path_, expected, keep);
+  if (keep) temporary_.clear();
+  return result == CommitResult::Taken ? SayChanged(path_) : result;
 }
 
 // Gives an unnamed sibling a temporary name.
 bool OutputFile::NameSibling() {
   if (FaultDue()) return false;
+  DeleteStaleFiles(FolderOf(path_));
   for (int attempt = 0; attempt < kAttempts; ++attempt) {
     std::string name = TemporarySibling(path_);
     if (NameUnnamed(handle_, name)) {
@@ -171,7 +230,13 @@ bool OutputFile::CopySibling() {
   if (fstat(handle_, &facts) != 0) return false;
   const Handle source(fcntl(handle_, F_DUPFD_CLOEXEC, 0));
   if (!source.IsOpen() || !CreateNamedSibling(facts.st_mode & 0777)) return false;
-  fchmod(handle_, facts.st_mode & 0777);
+  flock(handle_, LOCK_EX | LOCK_NB);
+  struct stat old;
+  if (lstat(path_.c_str(), &old) == 0 && S_ISREG(old.st_mode)) {
+    KeepLostAttributes(CopyAttributes(path_, old, handle_));
+  } else {
+    fchmod(handle_, facts.st_mode & 0777);
+  }
   off_t done = 0;
   while (done < facts.st_size) {
     const ssize_t count = sendfile(handle_, source.Number(), &done, kCopyStep);

@@ -13,15 +13,24 @@
 #include <utility>
 
 #include "platform/fault.h"
+#include "platform/lock_wait.h"
 #include "platform/posix/handle.h"
+#include "platform/posix/kept_reason.h"
+#include "platform/posix/lock_holder.h"
 #include "platform/process.h"
+#include "platform/reason.h"
 
 namespace fotomill::platform {
+
+std::function<void(const std::string& path, const std::string& holder)> onLongLockWait;
 
 namespace {
 
 constexpr std::chrono::microseconds kFirstPause{100};
 constexpr std::chrono::microseconds kLongestPause{10'000};
+constexpr std::chrono::seconds kSilentWait{2};   // then whose lock it is gets told
+constexpr std::chrono::seconds kLongestWait{10};
+constexpr off_t kUseMark = off_t{1} << 62;       // a byte that no file has, for the lock that says it is in use
 
 // Whether an open failed because there is nothing of that name. A link that leads nowhere is something; a file that has
 // come since then is not asked for, or who creates and removes files side by side would meet errors that are none.
@@ -51,12 +60,16 @@ StoreFile& StoreFile::operator=(StoreFile&& other) noexcept {
 
 StoreFile::OpenResult StoreFile::Open(const std::string& path, Mode mode) {
   Close();
+  ForgetReason();
   if (FaultDue()) return OpenResult::Failed;
   Handle handle;
   struct stat facts;
   if (mode == Mode::CreateNew) {
     handle = OpenHandle(path.c_str(), O_RDWR | O_CREAT | O_EXCL | O_NOFOLLOW, 0666);
-    if (!handle.IsOpen()) return errno == EEXIST ? OpenResult::Exists : OpenResult::Failed;
+    if (!handle.IsOpen()) {
+      KeepErrno();
+      return errno == EEXIST ? OpenResult::Exists : OpenResult::Failed;
+    }
     if (fstat(handle.Number(), &facts) != 0) return OpenResult::Failed;
   } else {
     handle = OpenRegular(path.c_str(), mode == Mode::Read ? O_RDONLY : O_RDWR | O_NOFOLLOW, facts);
@@ -114,11 +127,23 @@ bool StoreFile::Sync() { return IsOpen() && !FaultDue() && SyncHandle(static_cas
 
 // Asks again and again instead of waiting inside the system, so that Ctrl-C is heard.
 bool StoreFile::Lock() {
+  ForgetReason();
   if (!IsOpen() || FaultDue()) return false;
   std::chrono::microseconds pause = kFirstPause;
+  const auto begin = std::chrono::steady_clock::now();
+  bool told = false;
   while (flock(static_cast<int>(handle_), LOCK_EX | LOCK_NB) != 0) {
     if (errno != EWOULDBLOCK && errno != EINTR) return false;
     if (PendingExit() != 0) return false;
+    const auto waited = std::chrono::steady_clock::now() - begin;
+    if (waited > kLongestWait) {
+      KeepReason("It is locked by " + LockHolder(static_cast<int>(handle_)));
+      return false;
+    }
+    if (waited > kSilentWait && !told) {
+      told = true;
+      if (onLongLockWait) onLongLockWait(PathOfHandle(static_cast<int>(handle_)), LockHolder(static_cast<int>(handle_)));
+    }
     std::this_thread::sleep_for(pause);
     pause = std::min(pause * 2, kLongestPause);
   }
@@ -127,6 +152,27 @@ bool StoreFile::Lock() {
 
 void StoreFile::Unlock() {
   if (IsOpen()) flock(static_cast<int>(handle_), LOCK_UN);
+}
+
+bool StoreFile::Resize(uint64_t size) {
+  return IsOpen() && size <= INT64_MAX && !FaultDue() && ftruncate(static_cast<int>(handle_), static_cast<off_t>(size)) == 0;
+}
+
+// Locks of ranges are other locks than the one on the whole file, and end with the open file as that does.
+bool StoreFile::MarkInUse() {
+  struct flock range = {};
+  range.l_type = F_RDLCK;
+  range.l_start = kUseMark;
+  range.l_len = 1;
+  return IsOpen() && fcntl(static_cast<int>(handle_), F_OFD_SETLK, &range) == 0;
+}
+
+bool StoreFile::InUseByOthers() const {
+  struct flock range = {};
+  range.l_type = F_WRLCK;
+  range.l_start = kUseMark;
+  range.l_len = 1;
+  return IsOpen() && fcntl(static_cast<int>(handle_), F_OFD_GETLK, &range) == 0 && range.l_type != F_UNLCK;
 }
 
 bool StoreFile::IsStill(const std::string& path) const {

@@ -13,7 +13,10 @@
 #include "platform/folders.h"
 #include "platform/paths.h"
 #include "platform/posix/handle.h"
+#include "platform/posix/kept_reason.h"
+#include "platform/posix/stale_files.h"
 #include "platform/posix/temporary_names.h"
+#include "platform/reason.h"
 
 namespace fotomill::platform {
 
@@ -36,8 +39,8 @@ std::string RandomName(std::string_view extension) {
   uint32_t number = ++counter;
   if (getentropy(&number, sizeof number) != 0) errno = 0;  // then the counter has to do
   char digits[16];
-  std::snprintf(digits, sizeof digits, "FMWT%08x", number);
-  return std::string(digits).append(extension);
+  std::snprintf(digits, sizeof digits, "-%08x", number);
+  return ("FMWT" + OwnerOfTemporary()).append(digits).append(extension);
 }
 
 }  // namespace
@@ -46,12 +49,15 @@ bool TemporaryFile::Create(std::string_view extension) {
   Delete();
   if (extension.find('/') != std::string_view::npos || extension.find('\0') != std::string_view::npos) return false;
   const std::string folder = SpecialFolderPath(SpecialFolder::Temporary);
+  DeleteStaleFiles(folder);
+  ForgetReason();
   for (int attempt = 0; attempt < kAttempts && path_.empty(); ++attempt) {
     std::string path = JoinFolder(folder, RandomName(extension.empty() ? ".tmp" : extension));
     if (path.size() > kLongestPath) break;
     if (CreateExclusively(path)) {
       path_ = std::move(path);
     } else if (errno != EEXIST) {
+      KeepErrno();
       break;
     }
   }

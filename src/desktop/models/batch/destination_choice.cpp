@@ -3,6 +3,7 @@
 #include "batch/destination_name.h"
 #include "batch/new_job.h"
 #include "core/text.h"
+#include "platform/existence.h"
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "registry/registry.h"
@@ -47,7 +48,7 @@ std::string DestinationProblem(const DestinationChoice& choice) {
   if (row == kNoFormat || !CanWrite(FormatRow(row))) return Tr("The format cannot be written.");
   if (choice.folder.empty()) return {};
   if (choice.folder.size() > PathText::Capacity()) return Tr("The path of the folder is longer than 260 characters.");
-  if (platform::FileExists(choice.folder) && !platform::IsFolder(choice.folder))
+  if (platform::ExistenceOf(choice.folder) == platform::Existence::Yes && !platform::IsFolder(choice.folder))
     return Tr("\"%1\" is not a folder.", choice.folder);
   return {};
 }

@@ -12,6 +12,7 @@
 #include "platform/output_file.h"
 #include "platform/paths.h"
 #include "settings/settings.h"
+#include "texts/system_reason.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -33,17 +34,17 @@ Outcome CopyFile(const std::string& from, const std::string& to, platform::Exist
   constexpr size_t kPart = 4 * 1024 * 1024;
   platform::FileView view;
   platform::OutputFile output;
-  if (!view.Open(from)) return Tr("It cannot be read.");
-  if (!output.Create(to)) return Tr("The folder cannot be written to.");
+  if (!view.Open(from)) return WithReason(Tr("It cannot be read."));
+  if (!output.Create(to)) return WithReason(Tr("The folder cannot be written to."));
   const auto bytes = view.Bytes();
   for (size_t at = 0; at < bytes.size(); at += kPart) {
     if (!output.Write(bytes.subspan(at, std::min(kPart, bytes.size() - at))))
-      return Tr(kNotWritten);
+      return WithReason(Tr(kNotWritten));
   }
   if (!view.Intact()) return Tr("It was truncated while it was copied.");
   const platform::CommitResult result = output.Commit(existing);
   if (result == platform::CommitResult::Taken) return Tr(kTaken);
-  if (result != platform::CommitResult::Done) return Tr(kNotWritten);
+  if (result != platform::CommitResult::Done) return WithReason(Tr(kNotWritten));
   (void)platform::CopyTimes(from, to);
   return {};
 }
@@ -52,10 +53,10 @@ Outcome CopyTree(const std::string& from, const std::string& to, int depth) {
   if (!platform::IsFolder(from)) return CopyFile(from, to, platform::Existing::Refuse);
   if (depth > kDeepest) return Tr(kTooDeep);
   if (to.starts_with(platform::JoinFolder(from, ""))) return Tr("A folder cannot be copied into itself.");
-  if (platform::FileExists(to)) return Tr(kTaken);
+  if (platform::ExistenceOf(to) == platform::Existence::Yes) return Tr(kTaken);
   const auto entries = platform::ListFolder(from);
-  if (!entries) return Tr("The folder cannot be read.");
-  if (!platform::MakeFolders(to)) return Tr("The folder cannot be created.");
+  if (!entries) return WithReason(Tr("The folder cannot be read."));
+  if (!platform::MakeFolders(to)) return WithReason(Tr("The folder cannot be created."));
   for (const platform::FolderEntry& entry : *entries) {
     Outcome outcome = entry.link
                           ? Outcome(Tr("It contains a link, which is not copied."))
@@ -67,7 +68,7 @@ Outcome CopyTree(const std::string& from, const std::string& to, int depth) {
 
 Outcome DeleteTree(const std::string& path, int depth) {
   if (!platform::IsFolder(path) || platform::FactsOf(path).link) {
-    return platform::DeleteFile(path) ? Outcome() : Outcome(Tr("It could not be deleted."));
+    return platform::DeleteFile(path) ? Outcome() : Outcome(WithReason(Tr("It could not be deleted.")));
   }
   if (depth > kDeepest) return Tr(kTooDeep);
   for (const platform::FolderEntry& entry : platform::ListFolder(path).value_or(std::vector<platform::FolderEntry>())) {
@@ -83,7 +84,9 @@ bool SameVolume(const std::string& a, const std::string& b) {
 
 Outcome MoveOne(const std::string& from, const std::string& to) {
   if (!platform::FileExists(from)) return kGone;
-  if (platform::FileExists(to) && from != to) {
+  const platform::Existence existence = platform::ExistenceOf(to);
+  if (existence == platform::Existence::Unknown) return WithReason(Tr("It could not be renamed."));
+  if (existence == platform::Existence::Yes && from != to) {
     const platform::FileFacts a = platform::FactsOf(from), b = platform::FactsOf(to);
     const bool same = a.identity == b.identity && a.device == b.device;  // a name that differs in case only
     if (!same) return kTaken;
@@ -92,7 +95,7 @@ Outcome MoveOne(const std::string& from, const std::string& to) {
   const platform::CommitResult result = platform::RenameFile(from, to, platform::Existing::Refuse);
   if (result == platform::CommitResult::Done) return {};
   if (result == platform::CommitResult::Taken) return kTaken;
-  if (SameVolume(from, to)) return Tr("It could not be renamed.");
+  if (SameVolume(from, to)) return WithReason(Tr("It could not be renamed."));
   // On another volume a move is a copy and a deletion; what was copied goes again if the rest of it fails.
   Outcome outcome = CopyTree(from, to, 0);
   if (!outcome.empty()) {
@@ -174,9 +177,9 @@ FileDeed PlanDeed(DeedKind kind, const std::vector<std::string>& paths, const st
     std::string target = platform::JoinFolder(folder, platform::FileNameOf(path));
     if (kind == DeedKind::Move && target == path) continue;
     const TakenTest taken = [&](const std::string& candidate) {
-      return planned.contains(candidate) || platform::FileExists(candidate);
+      return planned.contains(candidate) ? platform::Existence::Yes : platform::ExistenceOf(candidate);
     };
-    if (taken(target)) (void)MakeNumberedVariant(target, settings.NumberedVariantMin, settings.NumberedVariantMax, taken);
+    if (taken(target) == platform::Existence::Yes) (void)MakeNumberedVariant(target, settings.NumberedVariantMin, settings.NumberedVariantMax, taken);
     planned.insert(target);
     deed.steps.push_back({path, target});
   }

@@ -7,6 +7,7 @@
 #include "batch/destination_name.h"
 #include "core/plain_name.h"
 #include "picture/picture_record.h"
+#include "platform/existence.h"
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "registry/registry.h"
@@ -26,8 +27,8 @@ std::string FreePath(const std::string& folder) {
   const std::string_view wanted = settings.ClipboardPictureName.view();
   const std::string name(IsPlainName(wanted) && !wanted.empty() ? wanted : defaultSettings.ClipboardPictureName.view());
   std::string path = platform::JoinFolder(folder, name + kExtension);
-  const bool free = !platform::FileExists(path) || MakeNumberedVariant(path, 1, INT32_MAX, platform::FileExists);
-  return free ? path : std::string();
+  if (platform::ExistenceOf(path) == platform::Existence::No) return path;
+  return MakeNumberedVariant(path, 1, INT32_MAX, platform::ExistenceOf) == VariantSearch::Found ? path : std::string();
 }
 
 Status ToRecord(const PastedPicture& pasted, PictureRecord& picture) {

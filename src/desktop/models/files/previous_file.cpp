@@ -7,9 +7,9 @@
 #include "core/whole_number.h"
 #include "desktop/models/thumbnails/thumbnail.h"
 #include "platform/clock.h"
+#include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
-#include "platform/unchanged_file.h"
 #include "settings/job_options.h"
 #include "settings/settings.h"
 #include "texts/texts.h"
@@ -32,7 +32,7 @@ std::vector<platform::FolderEntry> EntriesOf(const std::string& folder) {
 
 bool PreviousFile::Keep(const std::string& path) { return kept_.Keep(path, KeptFolder()); }
 
-bool PreviousFile::HasChanged(const std::string& path) const { return !platform::IsUnchanged(path, replaced_); }
+bool PreviousFile::HasChanged(const std::string& path) const { return !(platform::StampOf(path) == replaced_); }
 
 bool PreviousFiles::Keep(const std::string& path) {
   auto file = std::make_shared<PreviousFile>();

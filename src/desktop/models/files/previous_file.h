@@ -6,7 +6,7 @@
 #include <string>
 
 #include "desktop/models/browser/file_deeds.h"
-#include "platform/files.h"
+#include "platform/held_file.h"
 #include "platform/temporary_file.h"
 #include "processing/geometry/orient.h"
 
@@ -18,7 +18,7 @@ class PreviousFile {
   // Keeps the file as it is now. False if there is no room for it.
   [[nodiscard]] bool Keep(const std::string& path);
   // The file was replaced; what it is now is remembered.
-  void Replaced(const std::string& path) { replaced_ = platform::FactsOf(path); }
+  void Replaced(const std::string& path) { replaced_ = platform::StampOf(path); }
   // Whether somebody else has changed the file since it was replaced.
   bool HasChanged(const std::string& path) const;
   void Swap(PreviousFile& other) { kept_.Swap(other.kept_); }
@@ -26,7 +26,7 @@ class PreviousFile {
 
  private:
   platform::TemporaryFile kept_;
-  platform::FileFacts replaced_;
+  platform::FileStamp replaced_;
 };
 
 // The previous files of one batch; from any thread.

@@ -1,0 +1,87 @@
+#include "platform/posix/attributes.h"
+
+#include <fcntl.h>
+#include <sys/xattr.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <string_view>
+#include <vector>
+
+#include "platform/posix/handle.h"
+
+namespace fotomill::platform {
+
+namespace {
+
+constexpr const char* kAccessList = "system.posix_acl_access";
+constexpr size_t kMostTries = 3;  // attributes may grow while they are read
+
+// Attributes that belong to the file and not to its contents; signatures and capabilities of the old contents stay behind.
+bool GoesAlong(std::string_view name) {
+  return name.starts_with("user.") || name.starts_with("trusted.") || name == "security.selinux" || name == kAccessList;
+}
+
+// The system's own, which it gives to new files by itself: nobody misses them.
+bool IsMissed(std::string_view name) { return name.starts_with("user.") || name == kAccessList; }
+
+// What a call that fills a buffer gives, however long that is; false with errno.
+template <typename Call>
+bool ReadAll(Call call, std::vector<char>& into) {
+  for (size_t attempt = 0; attempt < kMostTries; ++attempt) {
+    const ssize_t size = call(nullptr, 0);
+    if (size < 0) return false;
+    into.resize(static_cast<size_t>(size));
+    if (size == 0) return true;
+    const ssize_t count = call(into.data(), into.size());
+    if (count >= 0) {
+      into.resize(static_cast<size_t>(count));
+      return true;
+    }
+    if (errno != ERANGE) return false;
+  }
+  return false;
+}
+
+void Add(std::string& list, std::string_view what) { list.append(list.empty() ? "" : ", ").append(what); }
+
+// Owner and group; only the superuser gives files away. Permissions meant for a group do not go to another one.
+void CopyOwner(const struct stat& old, int to, mode_t& mode, std::string& lost) {
+  struct stat now;
+  if (fstat(to, &now) != 0) return;
+  if (now.st_gid != old.st_gid && fchown(to, static_cast<uid_t>(-1), old.st_gid) != 0) {
+    Add(lost, "group");
+    mode &= ~static_cast<mode_t>(S_IRWXG) | (mode & S_IRWXO) << 3;
+  }
+  if (now.st_uid != old.st_uid && fchown(to, old.st_uid, static_cast<gid_t>(-1)) != 0) Add(lost, "owner");
+}
+
+bool CopyOne(const char* path, const char* name, int to) {
+  std::vector<char> value;
+  if (!ReadAll([&](char* data, size_t size) { return lgetxattr(path, name, data, size); }, value)) return errno == ENODATA;
+  return fsetxattr(to, name, value.data(), value.size(), 0) == 0;
+}
+
+}  // namespace
+
+std::string CopyAttributes(const std::string& path, const struct stat& old, int to) {
+  std::string lost;
+  mode_t mode = old.st_mode & 0777;
+  CopyOwner(old, to, mode, lost);
+  fchmod(to, mode);  // without the user's mask; where that fails it has fewer, never more
+  std::vector<char> names;
+  if (!ReadAll([&](char* data, size_t size) { return llistxattr(path.c_str(), data, size); }, names)) names.clear();
+  names.push_back('\0');
+  bool accessList = false;
+  for (const char* name = names.data(); *name != '\0'; name += std::string_view(name).size() + 1) {
+    accessList = accessList || std::string_view(name) == kAccessList;
+    if (GoesAlong(name) && !CopyOne(path.c_str(), name, to) && IsMissed(name)) {
+      Add(lost, std::string_view(name) == kAccessList ? "access control list" : "attribute " + std::string(name));
+    }
+  }
+  // What the folder gives to new files would let in whom the old file kept out.
+  if (!accessList && fremovexattr(to, kAccessList) == 0) fchmod(to, mode);
+  return lost;
+}
+
+}  // namespace fotomill::platform
