@@ -43,7 +43,7 @@ constexpr Place kPlaces[] = {
     {"BMP"},
     {"CDR", "(CDR) Corel Draw Preview", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES},
     {"CUT", "(CUT) Dr. Halo", 1, 8, FMT_BITMAP},
-    {"DCX", "(DCX) DCX FAX", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES},
+    {"DCX"},
     {"DIB"},
     {"EXE", "(EXE) Self-displaying image", 0, 24, FMT_BITMAP},
     {"FIT"},

@@ -30,6 +30,7 @@
 
 #include "core/byte_reader.h"
 #include "core/byte_writer.h"
+#include "formats/pcx/pcx_page.h"
 #include "formats/pcx/pcx_runs.h"
 #include "platform/file_view.h"
 #include "processing/pixel_rows.h"
@@ -153,12 +154,13 @@ Status ParseHeader(std::span<const uint8_t> file, PcxHeader& header) {
 
 // Fills `palette` with what the header's version and depth call for. FileReadError when a palette at the end is there
 // but cannot be read.
-Status ReadPalette(const platform::FileView& file, const PcxHeader& header, int32_t depth, Palette& palette) {
+Status ReadPalette(const platform::FileView& file, const PcxPlace& place, const PcxHeader& header, int32_t depth,
+                   Palette& palette) {
   MakeDefaultPalette(&palette, nullptr, depth == 24 ? kDisplayPalette : kBlackAndWhitePalette);
   if (depth == 1 || depth == 24) return Status::Ok;
-  if (depth == 8 && header.version >= kVersionTrailer && file.FileSize() >= kTrailerSize) {
+  if (depth == 8 && header.version >= kVersionTrailer && place.Size() >= kTrailerSize) {
     std::array<uint8_t, kTrailerSize> trailer;
-    if (!file.ReadAt(file.FileSize() - kTrailerSize, trailer)) return Status::FileReadError;
+    if (!file.ReadAt(place.end - kTrailerSize, trailer)) return Status::FileReadError;
     if (trailer[0] == kTrailerMark) {
       std::copy(trailer.begin() + 1, trailer.end(), palette.begin());
       return Status::Ok;
@@ -170,16 +172,19 @@ Status ReadPalette(const platform::FileView& file, const PcxHeader& header, int3
 }
 
 // Parses the header and fills the record's facts.
-Status DescribePicture(const platform::FileView& file, PictureRecord& picture, PcxHeader& header) {
+Status DescribePicture(const platform::FileView& file, const PcxPlace& place, PictureRecord& picture, PcxHeader& header) {
   picture.typeName.Clear();
   picture.fileSize = file.FileSize();
-  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
+  std::array<uint8_t, kHeaderSize> bytes;
+  const auto head = std::span(bytes).first(static_cast<size_t>(std::min(place.Size(), kHeaderSize)));
+  if (!file.ReadAt(place.begin, head)) return Status::FileReadError;
+  RETURN_IF_BAD(ParseHeader(head, header));
   picture.width = header.width;
   picture.height = header.height;
   picture.bitsPerPixel = FindArrangement(header)->depth;
   picture.imageBytes = (picture.bitsPerPixel == 24 ? header.LineSize() : header.bytesPerLine) * uint64_t(header.height);
   picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
-  return ReadPalette(file, header, picture.bitsPerPixel, picture.palette);
+  return ReadPalette(file, place, header, picture.bitsPerPixel, picture.palette);
 }
 
 // What the writer stores for a picture.
@@ -254,22 +259,14 @@ void WriteLines(ByteWriter& out, const PcxLayout& layout, const PictureRecord& p
 
 }  // namespace
 
-Status PcxInfo(PictureRecord& picture, const ReadRequest& request) {
-  platform::FileView file;
-  if (!file.OpenHead(request.fileName.c_str(), kHeaderSize)) return Status::FileOpenError;
+Status DescribePcx(const platform::FileView& file, const PcxPlace& place, PictureRecord& picture) {
   PcxHeader header;
-  return DescribePicture(file, picture, header);
+  return DescribePicture(file, place, picture, header);
 }
 
-Status PcxRead(PictureRecord& picture, const ReadRequest& request) {
-  const ProgressScope progress(picture);
-  picture.image.Free();
-  picture.alpha.Free();
-  platform::FileView file;
-  if (!file.Open(request.fileName)) return Status::FileOpenError;
+Status ReadPcx(platform::FileView& file, const PcxPlace& place, PictureRecord& picture) {
   PcxHeader header;
-  RETURN_IF_BAD(DescribePicture(file, picture, header));
-
+  RETURN_IF_BAD(DescribePicture(file, place, picture, header));
   PackedImage image;
   platform::MemoryBlock line;
   RETURN_IF_BAD(
@@ -277,7 +274,7 @@ Status PcxRead(PictureRecord& picture, const ReadRequest& request) {
   if (!line.Allocate(header.LineSize() + PcxLineDecoder::kSlack)) return Status::MemoryAllocationError;
   const SpreadRow spread = FindArrangement(header)->spread;
   const std::span<const uint8_t> decoded = line.Bytes().first(header.LineSize());
-  PcxLineDecoder decoder(file.Bytes().subspan(kHeaderSize));
+  PcxLineDecoder decoder(file.Bytes().subspan(place.begin + kHeaderSize, place.Size() - kHeaderSize));
   for (int32_t y = 0; y < header.height; ++y) {
     if (!decoder.Decode(line.Data(), header.LineSize())) return Status::FileReadError;
     spread(decoded, header, image.Row(y));
@@ -289,21 +286,41 @@ Status PcxRead(PictureRecord& picture, const ReadRequest& request) {
   return Status::Ok;
 }
 
-Status PcxWrite(PictureRecord& picture, const WriteOptions& options) {
-  const ProgressScope progress(picture);
-  if (picture.image.Empty()) return Status::MemoryAllocationError;
+Status WritePcx(ByteWriter& out, const PictureRecord& picture) {
   PcxLayout layout;
   RETURN_IF_BAD(ChooseLayout(picture, layout));
   platform::MemoryBlock planes;
   if (!planes.Allocate(uint64_t{layout.bytesPerLine} * layout.planes)) return Status::MemoryAllocationError;
-  ByteWriter out;
-  if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
   WriteHeader(out, layout, picture);
   WriteLines(out, layout, picture, planes.Bytes());
   if (layout.depth == 8) {
     out.U8(kTrailerMark);
     out.Bytes(picture.palette);
   }
+  return Status::Ok;
+}
+
+Status PcxInfo(PictureRecord& picture, const ReadRequest& request) {
+  platform::FileView file;
+  if (!file.OpenHead(request.fileName.c_str(), kHeaderSize)) return Status::FileOpenError;
+  return DescribePcx(file, {0, file.FileSize()}, picture);
+}
+
+Status PcxRead(PictureRecord& picture, const ReadRequest& request) {
+  const ProgressScope progress(picture);
+  picture.image.Free();
+  picture.alpha.Free();
+  platform::FileView file;
+  if (!file.Open(request.fileName)) return Status::FileOpenError;
+  return ReadPcx(file, {0, file.FileSize()}, picture);
+}
+
+Status PcxWrite(PictureRecord& picture, const WriteOptions& options) {
+  const ProgressScope progress(picture);
+  if (picture.image.Empty()) return Status::MemoryAllocationError;
+  ByteWriter out;
+  if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
+  RETURN_IF_BAD(WritePcx(out, picture));
   return CommitOutput(out, options);
 }
 

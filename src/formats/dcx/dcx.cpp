@@ -1,0 +1,86 @@
+// DCX, a collection of PCX pictures, little-endian. Fax programs store a page in each.
+//
+//   offset size  field
+//        0    4  signature 0x3ADE68B1
+//        4  4 x n  offsets of the pages from the start of the file, 1023 at most, then 0
+//        .       pages, each a PCX file
+//
+// A page ends where the next one in the file begins; the order of the offsets is that of the pages. The writer leaves
+// room for all offsets, as other programs do.
+// Source: ZSoft Corporation, "PCX Technical Reference Manual", revision 5 (1991).
+#include "formats/dcx/dcx.h"
+
+#include <algorithm>
+#include <vector>
+
+#include "core/byte_reader.h"
+#include "formats/pcx/pcx_page.h"
+#include "platform/file_view.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr uint32_t kSignature = 0x3ADE68B1;
+constexpr size_t kMostPages = 1023;
+constexpr uint64_t kDirectorySize = 4 + 4 * (kMostPages + 1);
+
+// FileReadError for a file without room for a signature, DamagedFile, NoImages for a collection without pages.
+Status ReadDirectory(std::span<const uint8_t> head, std::vector<uint32_t>& pages) {
+  ByteReader bytes(head);
+  const uint32_t signature = bytes.Le32();
+  if (!bytes.Ok()) return Status::FileReadError;
+  if (signature != kSignature) return Status::DamagedFile;
+  for (uint32_t offset = bytes.Le32(); offset != 0 && pages.size() < kMostPages; offset = bytes.Le32()) pages.push_back(offset);
+  return pages.empty() ? Status::NoImages : Status::Ok;
+}
+
+// Where a page of the file lies. NoImages when there is no such page, FileReadError when it lies behind the end.
+Status FindPage(const platform::FileView& file, int32_t page, PictureRecord& picture, PcxPlace& place) {
+  picture.typeName.Clear();
+  picture.fileSize = file.FileSize();
+  std::vector<uint32_t> pages;
+  RETURN_IF_BAD(ReadDirectory(file.Bytes().first(std::min<size_t>(file.Bytes().size(), kDirectorySize)), pages));
+  picture.pageCount = static_cast<int32_t>(pages.size());
+  if (page < 0 || page >= picture.pageCount) return Status::NoImages;
+  place = {pages[static_cast<size_t>(page)], file.FileSize()};
+  for (const uint32_t other : pages) {
+    if (other > place.begin) place.end = std::min<uint64_t>(place.end, other);
+  }
+  return place.begin < place.end ? Status::Ok : Status::FileReadError;
+}
+
+}  // namespace
+
+Status DcxInfo(PictureRecord& picture, const ReadRequest& request) {
+  platform::FileView file;
+  if (!file.OpenHead(request.fileName.c_str(), kDirectorySize)) return Status::FileOpenError;
+  PcxPlace place;
+  RETURN_IF_BAD(FindPage(file, request.page, picture, place));
+  return DescribePcx(file, place, picture);
+}
+
+Status DcxRead(PictureRecord& picture, const ReadRequest& request) {
+  const ProgressScope progress(picture);
+  picture.image.Free();
+  picture.alpha.Free();
+  platform::FileView file;
+  if (!file.Open(request.fileName)) return Status::FileOpenError;
+  PcxPlace place;
+  RETURN_IF_BAD(FindPage(file, request.page, picture, place));
+  return ReadPcx(file, place, picture);
+}
+
+Status DcxWrite(PictureRecord& picture, const WriteOptions& options) {
+  const ProgressScope progress(picture);
+  if (picture.image.Empty()) return Status::MemoryAllocationError;
+  ByteWriter out;
+  if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
+  out.Le32(kSignature);
+  out.Le32(static_cast<uint32_t>(kDirectorySize));
+  out.Zeros(kDirectorySize - out.Position());
+  RETURN_IF_BAD(WritePcx(out, picture));
+  return CommitOutput(out, options);
+}
+
+}  // namespace fotomill

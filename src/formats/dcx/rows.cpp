@@ -1,0 +1,31 @@
+#include "formats/rows.h"
+
+#include "formats/dcx/dcx.h"
+
+namespace fotomill {
+
+namespace {
+
+using namespace std::string_view_literals;
+
+constexpr Signature kSignatures[] = {{0, "\xb1\x68\xde\x3a"sv, "DCX"}};
+
+constexpr FormatEntry kRows[] = {{
+    .info = DcxInfo,
+    .read = DcxRead,
+    .write = DcxWrite,
+    .maxBits = 24,
+    .extension = "DCX"sv,
+    .description = "(DCX) DCX FAX"sv,
+    .enabled = 1,
+    .flags = FMT_BITMAP | FMT_MULTI | FMT_PAGES,
+    .canRead = true,
+    .canWrite = true,
+    .signatures = kSignatures,
+}};
+
+}  // namespace
+
+std::span<const FormatEntry> DcxRows() { return kRows; }
+
+}  // namespace fotomill
