@@ -10,6 +10,7 @@
 #include "desktop/models/shell/session.h"
 #include "desktop/models/shell/tab_sets.h"
 #include "desktop/models/thumbnails/thumbnail.h"
+#include "platform/files.h"
 #include "registry/registry.h"
 #include "support/bitmaps.h"
 #include "support/files.h"
