@@ -1,16 +1,12 @@
 #pragma once
 
 #include <cstdint>
+#include <span>
 
 #include "processing/color/point_effect.h"
 
+// Effects whose channels are independent: tables, which the engine merges with their neighbors.
 namespace fotomill {
-
-// Brightness of a color as television defines it: 0.299 R + 0.587 G + 0.114 B, rounded to nearest.
-// Source: ITU-R BT.601-7, section 2.5.1.
-constexpr uint8_t Luma(uint8_t red, uint8_t green, uint8_t blue) {
-  return static_cast<uint8_t>((299 * red + 587 * green + 114 * blue + 500) / 1000);
-}
 
 // v + 2.55 b, for b from -100 to 100.
 PointEffect BrightnessEffect(double b);
@@ -20,7 +16,34 @@ PointEffect ContrastEffect(double c);
 PointEffect GammaEffect(double g);
 // 255 - v.
 PointEffect InvertEffect();
-// Every channel becomes the luma.
-PointEffect GrayEffect();
+
+// What LevelsEffect maps: `black` to `outBlack`, `white` (above `black`) to `outWhite`, and between them
+// outBlack + (outWhite - outBlack) ((v - black) / (white - black))^(1 / gamma). Values beyond either end become that end's.
+struct Levels {
+  double black = 0, white = 255;
+  double gamma = 1;
+  double outBlack = 0, outWhite = 255;
+};
+PointEffect LevelsEffect(const Levels& levels);
+
+// A point of a curve: old and new value, 0 to 255.
+struct CurveKnot {
+  double x, y;
+};
+// Which channels a curve changes.
+enum class CurveChannel : int32_t { All, Red, Green, Blue };
+// A smooth curve through two or more knots from left to right that never overshoots them: cubic pieces with limited slopes.
+// Level before the first knot and behind the last. Source: Fritsch and Carlson, "Monotone Piecewise Cubic
+// Interpolation", SIAM J. Numer. Anal. 17 (1980).
+PointEffect CurveEffect(std::span<const CurveKnot> knots, CurveChannel channel);
+
+// round(v (n - 1) / 255) 255 / (n - 1), for n of 2 or more levels.
+PointEffect PosterizeEffect(int32_t n);
+// 255 - v for v of t and more.
+PointEffect SolarizeEffect(double t);
+// Red times 1 + t / 400 and blue times 1 - t / 400, for t from -100 (cold) to 100 (warm).
+PointEffect TemperatureEffect(double t);
+// v + (color - v) percent / 100. `bgr` is the color.
+PointEffect TintEffect(std::span<const uint8_t, 3> bgr, double percent);
 
 }  // namespace fotomill

@@ -68,7 +68,8 @@ struct Plan {
   void Shares(int32_t i, double* shares) const {
     const int32_t first = First(i), taps = End(i) - first;
     double sum = 0;
-    for (int32_t t = 0; t < taps; ++t) sum += shares[t] = shape.value((first + t + 0.5 - Center(i)) / widen);
+    // Where a pixel lies exactly on a box's border, the order of these sums decides: it is that of the peers.
+    for (int32_t t = 0; t < taps; ++t) sum += shares[t] = shape.value((t + first - Center(i) + 0.5) * (1 / widen));
     for (int32_t t = 0; t < taps; ++t) shares[t] = sum != 0 ? shares[t] / sum : 1.0 / taps;
   }
 };
@@ -109,8 +110,9 @@ Status FilterWindows::Make(const SourceEdge& edge, int32_t count, ScaleFilter fi
   shift_ = mostShift;
   while (shift_ > 1 && std::ldexp(largest, shift_) > INT16_MAX - 1) --shift_;
 
-  // Equal halves of an edge get windows that mirror each other to the last bit.
-  const bool mirrored = 2 * edge.begin + edge.extent == edge.count;
+  // Equal halves of an edge get windows that mirror each other to the last bit. The box has no mirror: of two pixels at
+  // its borders it takes the left one.
+  const bool mirrored = filter != ScaleFilter::Box && 2 * edge.begin + edge.extent == edge.count;
   for (int32_t i = 0; i < count; ++i) {
     const size_t place = static_cast<size_t>(i) * static_cast<size_t>(mostTaps_);
     int16_t* weights = weights_.Items<int16_t>().data() + place;

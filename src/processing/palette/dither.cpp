@@ -1,30 +1,26 @@
 #include "processing/palette/dither.h"
 
 #include <algorithm>
-#include <array>
 #include <cstdlib>
 
 namespace fotomill {
 
 namespace {
 
-// Bayer's pattern: the order in which the pixels of a square of 8 x 8 turn white, 0 to 63.
-constexpr std::array<std::array<int32_t, 8>, 8> MakePattern() {
-  std::array<std::array<int32_t, 8>, 8> pattern{};
-  for (int y = 0; y < 8; ++y) {
-    for (int x = 0; x < 8; ++x) {
-      int order = 0;
-      for (int bit = 0; bit < 3; ++bit) {
-        const int across = x >> bit & 1, down = y >> bit & 1;
-        order = order << 2 | (across ^ down) << 1 | down;
-      }
-      pattern[static_cast<size_t>(y)][static_cast<size_t>(x)] = order;
-    }
+// Bayer's pattern: the order in which the pixels of a square of `size` x `size` (2, 4 or 8) turn white, from 0 on.
+constexpr int32_t PatternOrder(int32_t size, int32_t x, int32_t y) {
+  int32_t order = 0;
+  for (int32_t bit = 0; 1 << bit < size; ++bit) {
+    const int32_t across = x >> bit & 1, down = y >> bit & 1;
+    order = order << 2 | (across ^ down) << 1 | down;
   }
-  return pattern;
+  return order;
 }
-constexpr auto kPattern = MakePattern();
-static_assert(kPattern[0][0] == 0 && kPattern[0][1] == 32 && kPattern[1][0] == 48 && kPattern[1][1] == 16);
+static_assert(PatternOrder(8, 0, 0) == 0 && PatternOrder(8, 1, 0) == 32 && PatternOrder(8, 0, 1) == 48 && PatternOrder(8, 1, 1) == 16);
+static_assert(PatternOrder(2, 1, 0) == 2 && PatternOrder(2, 0, 1) == 3 && PatternOrder(2, 1, 1) == 1);
+
+// Columns that a row of a pattern is written out for.
+constexpr int32_t kColumns = 8;
 
 constexpr int32_t Clamp(int32_t value) { return std::clamp(value, 0, 255); }
 
@@ -34,19 +30,20 @@ void MapRow(const uint8_t* bgr, int32_t width, NearestColor& nearest, uint8_t* i
   for (int32_t x = 0; x < width; ++x, bgr += 3) indices[x] = nearest.Find(bgr[0], bgr[1], bgr[2]);
 }
 
-void OrderRow(const uint8_t* bgr, int32_t width, int32_t y, int32_t spread, NearestColor& nearest, uint8_t* indices) {
-  int32_t offsets[8];
-  for (size_t i = 0; i < 8; ++i) offsets[i] = (2 * kPattern[static_cast<size_t>(y & 7)][i] - 63) * spread / 128;
+void OrderRow(const uint8_t* bgr, int32_t width, int32_t y, int32_t size, int32_t spread, NearestColor& nearest, uint8_t* indices) {
+  const int32_t places = size * size;
+  int32_t offsets[kColumns];
+  for (int32_t i = 0; i < kColumns; ++i) offsets[i] = (2 * PatternOrder(size, i, y) - (places - 1)) * spread / (2 * places);
   for (int32_t x = 0; x < width; ++x, bgr += 3) {
     const int32_t offset = offsets[x & 7];
     indices[x] = nearest.Find(Clamp(bgr[0] + offset), Clamp(bgr[1] + offset), Clamp(bgr[2] + offset));
   }
 }
 
-void OrderGrayRow(const uint8_t* gray, int32_t width, int32_t y, uint8_t* indices) {
-  // The 65 shades of the pattern lie evenly between black and white: 0 is never white, 255 always is.
-  int32_t limits[8];
-  for (size_t i = 0; i < 8; ++i) limits[i] = (2 * kPattern[static_cast<size_t>(y & 7)][i] + 1) * 255 / 128 + 1;
+void OrderGrayRow(const uint8_t* gray, int32_t width, int32_t y, int32_t size, uint8_t* indices) {
+  // The shades of the pattern, one more than it has places, lie evenly between black and white: 0 is never white, 255 always is.
+  int32_t limits[kColumns];
+  for (int32_t i = 0; i < kColumns; ++i) limits[i] = (2 * PatternOrder(size, i, y) + 1) * 255 / (2 * size * size) + 1;
   for (int32_t x = 0; x < width; ++x) indices[x] = gray[x] >= limits[x & 7];
 }
 

@@ -8,14 +8,32 @@
 
 namespace fotomill {
 
+// How the colors that a palette lacks are imitated. The first three are the values of the keys FXColorDither (4 and 8 bits)
+// and FXMonoDither (1 bit).
+enum class Dither : int32_t {
+  None = 0,            // each pixel takes the nearest color, or is cut at the threshold
+  Ordered = 1,         // a fixed pattern of 8 x 8 thresholds (Bayer 1973)
+  FloydSteinberg = 2,  // each pixel's error goes to its neighbors (Floyd and Steinberg 1976)
+  Ordered4 = 3,        // patterns of 4 x 4 and 2 x 2
+  Ordered2 = 4,
+  Atkinson = 5,        // error diffusion as diffusion.h says
+  Stucki = 6,
+  Burkes = 7,
+  Sierra = 8,
+};
+// The edge of the pattern of an ordered dither, 0 for others.
+constexpr int32_t PatternSize(Dither dither) {
+  return dither == Dither::Ordered ? 8 : dither == Dither::Ordered4 ? 4 : dither == Dither::Ordered2 ? 2 : 0;
+}
+
 // Each function turns one row of pixels into one byte each: an index into the palette that `nearest` searches, or 1 for
 // white and 0 for black of a row of brightnesses.
 
 // Each pixel takes the color nearest to it.
 void MapRow(const uint8_t* bgr, int32_t width, NearestColor& nearest, uint8_t* indices);
-// `y` chooses the row of the threshold pattern; `spread` is the distance of two colors that it is to bridge.
-void OrderRow(const uint8_t* bgr, int32_t width, int32_t y, int32_t spread, NearestColor& nearest, uint8_t* indices);
-void OrderGrayRow(const uint8_t* gray, int32_t width, int32_t y, uint8_t* indices);
+// `y` chooses the row of the threshold pattern of `size` x `size`; `spread` is the distance of two colors that it is to bridge.
+void OrderRow(const uint8_t* bgr, int32_t width, int32_t y, int32_t size, int32_t spread, NearestColor& nearest, uint8_t* indices);
+void OrderGrayRow(const uint8_t* gray, int32_t width, int32_t y, int32_t size, uint8_t* indices);
 // White from `threshold` on.
 void CutGrayRow(const uint8_t* gray, int32_t width, int32_t threshold, uint8_t* indices);
 

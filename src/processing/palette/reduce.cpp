@@ -3,10 +3,14 @@
 #include <algorithm>
 #include <array>
 #include <cmath>
+#include <cstdlib>
+#include <functional>
 
 #include "processing/color/color_histogram.h"
+#include "processing/color/mix.h"
 #include "processing/color/nearest_color.h"
 #include "processing/flatten.h"
+#include "processing/palette/diffusion.h"
 #include "processing/palette/dither.h"
 #include "processing/palette/fit_palette.h"
 #include "processing/promote.h"
@@ -25,11 +29,16 @@ constexpr int32_t kFewCells = 1024;          // a picture of fewer cells of colo
 // less is diffused there, the less the closer the colors are.
 constexpr int32_t kHandedOnMono = 16, kHandedOnFew = 12, kHandedOnMany = 10;
 constexpr int32_t kFew = 16;  // colors
+constexpr int32_t kRowsUnasked = 32;  // between two questions whether to go on
 
 // Brightness 0 to 255 (ITU-R BT.601); of a gray it is the gray itself.
 constexpr uint8_t Brightness(const uint8_t* bgr) {
   return static_cast<uint8_t>((29 * bgr[0] + 150 * bgr[1] + 77 * bgr[2] + 128) >> 8);
 }
+
+// Luma of the operations: rounded for dithers, rounded down for thresholds, which compares as the exact one does.
+uint8_t RoundedLuma(const uint8_t* bgr) { return Luma(bgr[2], bgr[1], bgr[0]); }
+uint8_t LumaBelow(const uint8_t* bgr) { return static_cast<uint8_t>(LumaThousandths(bgr[2], bgr[1], bgr[0]) / 1000); }
 
 // The rows of a picture as they are to be reduced: 24 bits, adjusted, and gray where wanted.
 class SourceRows {
@@ -58,9 +67,10 @@ class SourceRows {
     return row;
   }
 
+  template <uint8_t (*brightnessOf)(const uint8_t* bgr) = Brightness>
   void BrightnessRow(int32_t y, uint8_t* brightness) {
     const uint8_t* row = Row(y);
-    for (int32_t x = 0; x < width_; ++x) brightness[x] = Brightness(row + 3 * static_cast<size_t>(x));
+    for (int32_t x = 0; x < width_; ++x) brightness[x] = brightnessOf(row + 3 * static_cast<size_t>(x));
   }
 
  private:
@@ -112,6 +122,23 @@ int32_t PaletteSpacing(const Palette& palette, int32_t count) {
   return static_cast<int32_t>(sum / count);
 }
 
+// The same for palettes that are even in each channel: what one channel has to bridge.
+int32_t ChannelSpacing(const Palette& palette, int32_t count) {
+  int32_t sum = 0;
+  for (int32_t i = 0; i < count; ++i) {
+    int32_t least = 255;
+    for (int32_t j = 0; j < count; ++j) {
+      int32_t distance = 0;
+      for (int32_t c = 0; c < 3; ++c) {
+        distance = std::max(distance, std::abs(palette[static_cast<size_t>(3 * i + c)] - palette[static_cast<size_t>(3 * j + c)]));
+      }
+      if (j != i) least = std::min(least, distance);
+    }
+    sum += least;
+  }
+  return sum / count;
+}
+
 Palette EvenGrays(int32_t count) {
   Palette palette{};
   for (int32_t i = 0; i < count; ++i) {
@@ -137,38 +164,64 @@ struct Reduction {
   PackedImage made;
   Palette palette{};
   int32_t colors = 2;
+  int32_t handedOn = kHandedOnMono;  // sixteenths
+  bool even = false;                 // the palette was not fitted
+  const Work* work = nullptr;        // asked now and then, where there is one
 
   int32_t Width() const { return picture.image.Width(); }
   int32_t Height() const { return picture.image.Height(); }
-  void StoreRow(int32_t y) {
+  // FunctionCancelled when the work was stopped.
+  Status StoreRow(int32_t y) {
     PackIndices(indices.Data(), Width(), bits, made.Row(y).data());
     picture.ReportRow(y + 1);
+    return work != nullptr && y % kRowsUnasked == 0 && !work->GoesOn() ? Status::FunctionCancelled : Status::Ok;
+  }
+  Status OpenRows() {
+    RETURN_IF_BAD(source.Open(picture.image, options));
+    const auto width = static_cast<uint64_t>(Width());
+    return indices.Allocate(width, platform::Fill::Unset) ? Status::Ok : Status::MemoryAllocationError;
+  }
+  void Finish() {
+    picture.image = std::move(made);
+    picture.palette = palette;
+    picture.bitsPerPixel = bits;
   }
 };
 
-Status ReduceToMono(Reduction& work) {
+// Writes the row of brightnesses of row y.
+using BrightnessRows = std::function<void(int32_t y, uint8_t* brightness)>;
+
+Status DitherToMono(Reduction& work, const BrightnessRows& brightnessRow) {
   const int32_t width = work.Width(), height = work.Height();
+  const Dither dither = work.options.monoDither;
   platform::MemoryBlock gray;
   if (!gray.Allocate(static_cast<uint64_t>(width), platform::Fill::Unset)) return Status::MemoryAllocationError;
   ErrorDiffuser diffuser;
   RETURN_IF_BAD(diffuser.Open(width, work.options.serpentine, kHandedOnMono));
+  WideDiffuser wide;
+  if (IsWideDiffusion(dither)) RETURN_IF_BAD(wide.Open(dither, width, work.options.serpentine, kHandedOnMono));
   int32_t threshold = work.options.threshold;
-  if (work.options.monoDither == Dither::None && threshold == 0) {
+  if (dither == Dither::None && threshold == 0) {
     std::array<uint64_t, 256> counts{};
     for (int32_t y = 0; y < height; ++y) {
-      work.source.BrightnessRow(y, gray.Data());
+      brightnessRow(y, gray.Data());
       for (const uint8_t level : gray.Bytes()) ++counts[level];
     }
     threshold = BestThreshold(counts);
   }
   for (int32_t y = 0; y < height; ++y) {
-    work.source.BrightnessRow(y, gray.Data());
-    switch (work.options.monoDither) {
-      case Dither::None: CutGrayRow(gray.Data(), width, threshold, work.indices.Data()); break;
-      case Dither::Ordered: OrderGrayRow(gray.Data(), width, y, work.indices.Data()); break;
-      case Dither::FloydSteinberg: diffuser.GrayRow(gray.Data(), work.indices.Data()); break;
+    brightnessRow(y, gray.Data());
+    uint8_t* const indices = work.indices.Data();
+    if (dither == Dither::None) {
+      CutGrayRow(gray.Data(), width, threshold, indices);
+    } else if (const int32_t size = PatternSize(dither); size > 0) {
+      OrderGrayRow(gray.Data(), width, y, size, indices);
+    } else if (dither == Dither::FloydSteinberg) {
+      diffuser.GrayRow(gray.Data(), indices);
+    } else {
+      wide.GrayRow(gray.Data(), indices);
     }
-    work.StoreRow(y);
+    RETURN_IF_BAD(work.StoreRow(y));
   }
   return Status::Ok;
 }
@@ -199,21 +252,25 @@ Status RefineOnPixels(Reduction& work, NearestColor& nearest, ColorPoints& point
   return Status::Ok;
 }
 
-// Puts the palette for more than two colors into `work`, and its colors into `nearest`.
-Status ChoosePalette(Reduction& work, NearestColor& nearest) {
-  const int32_t most = 1 << work.bits;
+// A palette of at most `most` colors that suits the picture.
+Status FitToPicture(Reduction& work, int32_t most, NearestColor& nearest, ColorPoints& points) {
+  std::vector<ColorBin> bins;
+  RETURN_IF_BAD(GatherColors<ColorCells>(work, bins));
+  if (bins.size() < kFewCells) RETURN_IF_BAD(GatherColors<ColorCounts>(work, bins));
+  RETURN_IF_BAD(FitPalette(bins, most, points));
+  RETURN_IF_BAD(RefineOnPixels(work, nearest, points));
+  SortByBrightness(points);
+  return Status::Ok;
+}
+
+// Puts the chosen palette into `work`, and its colors into `nearest`.
+Status ChoosePalette(Reduction& work, const PaletteChoice& choice, NearestColor& nearest) {
   RETURN_IF_BAD(nearest.Open(true));
   ColorPoints points;
-  if (work.options.grays) {
-    const int32_t count = work.options.grayLevels == 0 ? most : std::min(most, work.options.grayLevels);
-    points = PointsOf(EvenGrays(count), count);
-  } else {
-    std::vector<ColorBin> bins;
-    RETURN_IF_BAD(GatherColors<ColorCells>(work, bins));
-    if (bins.size() < kFewCells) RETURN_IF_BAD(GatherColors<ColorCounts>(work, bins));
-    RETURN_IF_BAD(FitPalette(bins, most, points));
-    RETURN_IF_BAD(RefineOnPixels(work, nearest, points));
-    SortByBrightness(points);
+  switch (choice.kind) {
+    case PaletteChoice::Kind::Fitted: RETURN_IF_BAD(FitToPicture(work, choice.colors, nearest, points)); break;
+    case PaletteChoice::Kind::Grays: points = PointsOf(EvenGrays(choice.colors), choice.colors); break;
+    case PaletteChoice::Kind::Given: points = PointsOf(choice.given, choice.colors); break;
   }
   work.palette = PaletteOf(points);
   work.colors = points.count;
@@ -221,20 +278,54 @@ Status ChoosePalette(Reduction& work, NearestColor& nearest) {
   return Status::Ok;
 }
 
-Status ReduceToPalette(Reduction& work, NearestColor& nearest) {
+Status DitherToPalette(Reduction& work, NearestColor& nearest) {
+  const Dither dither = work.options.colorDither;
   ErrorDiffuser diffuser;
-  RETURN_IF_BAD(diffuser.Open(work.Width(), work.options.serpentine, work.colors <= kFew ? kHandedOnFew : kHandedOnMany));
-  const int32_t spacing = PaletteSpacing(work.palette, work.colors);
+  RETURN_IF_BAD(diffuser.Open(work.Width(), work.options.serpentine, work.handedOn));
+  WideDiffuser wide;
+  if (IsWideDiffusion(dither)) RETURN_IF_BAD(wide.Open(dither, work.Width(), work.options.serpentine, work.handedOn));
+  const int32_t spacing = work.even ? ChannelSpacing(work.palette, work.colors) : PaletteSpacing(work.palette, work.colors);
   for (int32_t y = 0; y < work.Height(); ++y) {
     const uint8_t* row = work.source.Row(y);
-    switch (work.options.colorDither) {
-      case Dither::None: MapRow(row, work.Width(), nearest, work.indices.Data()); break;
-      case Dither::Ordered: OrderRow(row, work.Width(), y, spacing, nearest, work.indices.Data()); break;
-      case Dither::FloydSteinberg: diffuser.Row(row, nearest, work.indices.Data()); break;
+    uint8_t* const indices = work.indices.Data();
+    if (dither == Dither::None) {
+      MapRow(row, work.Width(), nearest, indices);
+    } else if (const int32_t size = PatternSize(dither); size > 0) {
+      OrderRow(row, work.Width(), y, size, spacing, nearest, indices);
+    } else if (dither == Dither::FloydSteinberg) {
+      diffuser.Row(row, nearest, indices);
+    } else {
+      wide.Row(row, nearest, indices);
     }
-    work.StoreRow(y);
+    RETURN_IF_BAD(work.StoreRow(y));
   }
   return Status::Ok;
+}
+
+int32_t HandedOn(int32_t colors) { return colors <= kFew ? kHandedOnFew : kHandedOnMany; }
+
+constexpr int32_t DepthOf(int32_t colors) { return colors <= 2 ? 1 : colors <= 16 ? 4 : 8; }
+
+// How many colors a picture has; more than `most`, as most + 1.
+Status CountColors(const PackedImage& image, int32_t most, int32_t& colors) {
+  BgrRows rows;
+  RETURN_IF_BAD(rows.Open(image));
+  ColorSet set;
+  colors = most + 1;
+  for (int32_t y = 0; y < image.Height(); ++y) {
+    if (!set.AddRow(rows.Row(y), image.Width(), most)) return Status::Ok;
+  }
+  colors = set.Count();
+  return Status::Ok;
+}
+
+// Whether all colors of the picture fit and need no dithering: then it is as shallow as they allow.
+Status KeepFewColors(PictureRecord& picture, int32_t most, bool& kept) {
+  int32_t colors = 0;
+  RETURN_IF_BAD(CountColors(picture.image, most, colors));
+  kept = colors <= most;
+  bool packed = false;
+  return kept ? PackFewColors(picture, DepthOf(colors), packed) : Status::Ok;
 }
 
 }  // namespace
@@ -251,19 +342,64 @@ Status ReduceColors(PictureRecord& picture, int32_t maxBits, const ReduceOptions
 
   const ProgressScope progress(picture);
   Reduction work{picture, options, bits, {}, {}, {}};
-  RETURN_IF_BAD(work.source.Open(picture.image, options));
-  if (!work.indices.Allocate(static_cast<uint64_t>(work.Width()), platform::Fill::Unset)) return Status::MemoryAllocationError;
+  RETURN_IF_BAD(work.OpenRows());
   NearestColor nearest;
   if (bits == 1) {
     work.palette = EvenGrays(2);
   } else {
-    RETURN_IF_BAD(ChoosePalette(work, nearest));
+    const int32_t most = 1 << bits;
+    const bool fewer = options.grays && options.grayLevels != 0;
+    const PaletteChoice choice{.kind = options.grays ? PaletteChoice::Kind::Grays : PaletteChoice::Kind::Fitted,
+                               .colors = fewer ? std::min(most, options.grayLevels) : most};
+    RETURN_IF_BAD(ChoosePalette(work, choice, nearest));
+    work.handedOn = HandedOn(work.colors);
   }
   RETURN_IF_BAD(NewPackedImage(work.Width(), work.Height(), &work.palette, bits, work.made));
-  RETURN_IF_BAD(bits == 1 ? ReduceToMono(work) : ReduceToPalette(work, nearest));
-  picture.image = std::move(work.made);
-  picture.palette = work.palette;
-  picture.bitsPerPixel = bits;
+  const auto brightness = [&](int32_t y, uint8_t* row) { work.source.BrightnessRow(y, row); };
+  RETURN_IF_BAD(bits == 1 ? DitherToMono(work, brightness) : DitherToPalette(work, nearest));
+  work.Finish();
+  return Status::Ok;
+}
+
+Status ReduceToPalette(PictureRecord& picture, const PaletteChoice& choice, const ReduceOptions& options, const Work& goingOn) {
+  if (picture.image.Empty()) return Status::EmptyImage;
+  const bool fitted = choice.kind == PaletteChoice::Kind::Fitted, adjusted = options.brightness != 0 || options.contrast != 0;
+  bool kept = false;
+  if (fitted && !adjusted) RETURN_IF_BAD(KeepFewColors(picture, choice.colors, kept));
+  if (kept) return Status::Ok;
+
+  const ProgressScope progress(picture);
+  ReduceOptions wanted = options;
+  wanted.grays = choice.kind == PaletteChoice::Kind::Grays;
+  Reduction work{picture, wanted, 8, {}, {}, {}};
+  work.work = &goingOn;
+  RETURN_IF_BAD(work.OpenRows());
+  NearestColor nearest;
+  RETURN_IF_BAD(ChoosePalette(work, choice, nearest));
+  work.bits = DepthOf(work.colors);
+  work.even = !fitted;
+  if (fitted) work.handedOn = HandedOn(work.colors);
+  RETURN_IF_BAD(NewPackedImage(work.Width(), work.Height(), &work.palette, work.bits, work.made));
+  RETURN_IF_BAD(DitherToPalette(work, nearest));
+  work.Finish();
+  return Status::Ok;
+}
+
+Status ReduceToMono(PictureRecord& picture, const ReduceOptions& options, const Work& goingOn) {
+  if (picture.image.Empty()) return Status::EmptyImage;
+  const ProgressScope progress(picture);
+  ReduceOptions wanted = options;
+  wanted.grays = false;
+  Reduction work{picture, wanted, 1, {}, {}, {}};
+  work.work = &goingOn;
+  RETURN_IF_BAD(work.OpenRows());
+  work.palette = EvenGrays(2);
+  RETURN_IF_BAD(NewPackedImage(work.Width(), work.Height(), &work.palette, 1, work.made));
+  const bool cut = options.monoDither == Dither::None;
+  RETURN_IF_BAD(DitherToMono(work, [&](int32_t y, uint8_t* row) {
+    cut ? work.source.BrightnessRow<LumaBelow>(y, row) : work.source.BrightnessRow<RoundedLuma>(y, row);
+  }));
+  work.Finish();
   return Status::Ok;
 }
 

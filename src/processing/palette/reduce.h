@@ -3,17 +3,12 @@
 #include <cstdint>
 
 #include "core/status.h"
+#include "picture/palette.h"
 #include "picture/picture_record.h"
+#include "processing/bands.h"
+#include "processing/palette/dither.h"
 
 namespace fotomill {
-
-// How the colors that a palette lacks are imitated: the values of the keys FXColorDither (4 and 8 bits) and FXMonoDither
-// (1 bit).
-enum class Dither : int32_t {
-  None = 0,            // each pixel takes the nearest color, or is cut at the threshold
-  Ordered = 1,         // a fixed pattern of 8 x 8 thresholds (Bayer 1973)
-  FloydSteinberg = 2,  // each pixel's error goes to its neighbours (Floyd and Steinberg 1976)
-};
 
 // How colors are reduced; ReduceColors without options takes them from the keys.
 struct ReduceOptions {
@@ -34,5 +29,27 @@ struct ReduceOptions {
 // to the picture (black and white for 1 bit) and the pixels are dithered as the options say. Without a picture:
 // EmptyImage. MemoryAllocationError when a block cannot be had; `image` is then whole, but may be flattened.
 Status ReduceColors(PictureRecord& picture, int32_t maxBits, const ReduceOptions& options);
+
+// Which colors a picture gets.
+struct PaletteChoice {
+  enum class Kind : uint8_t {
+    Fitted,  // the colors that suit the picture best
+    Grays,   // evenly spaced from black to white
+    Given,   // those of `given`
+  };
+  Kind kind = Kind::Fitted;
+  int32_t colors = 256;  // 2 to 256: the most of a fitted palette, else the number there is
+  Palette given{};
+};
+
+// Brings a picture of any depth down to a palette: to 1, 4 or 8 bits, as few as its colors need, dithered as the options
+// say. Where a fitted palette would hold all colors that the picture has, they are kept exactly. Alpha stays. Errors are
+// diffused in full unless the palette is fitted. EmptyImage (31), MemoryAllocationError (6), FunctionCancelled (4); the
+// picture is unchanged then.
+Status ReduceToPalette(PictureRecord& picture, const PaletteChoice& choice, const ReduceOptions& options, const Work& work);
+
+// The same to black and white at 1 bit, by the luma; `threshold`, `monoDither`, `serpentine`, `brightness` and `contrast`
+// of the options count.
+Status ReduceToMono(PictureRecord& picture, const ReduceOptions& options, const Work& work);
 
 }  // namespace fotomill

@@ -1,0 +1,166 @@
+#include "processing/color/mix.h"
+
+#include <algorithm>
+#include <cmath>
+#include <cstring>
+#include <memory>
+#include <utility>
+
+namespace fotomill {
+
+namespace {
+
+// Sums are fixed-point numbers: of a level that a sum can reach, 11 bits are whole and 20 a fraction.
+constexpr int32_t kFraction = 20;
+// What rounding the three parts of a sum may have lost, so that ties still round up.
+constexpr double kTieBias = 2;
+
+using Four [[gnu::vector_size(16)]] = int32_t;
+using FourBytes [[gnu::vector_size(4)]] = uint8_t;
+
+// What each value of each old channel adds to the new blue, green and red.
+struct MixTables {
+  std::array<std::array<Four, 256>, 3> parts;  // of old blue, green, red
+};
+
+void ApplyMix(const MixTables& tables, uint8_t* bgr, size_t pixels) {
+  const Four *blue = tables.parts[0].data(), *green = tables.parts[1].data(), *red = tables.parts[2].data();
+  const auto mixed = [&] {
+    Four sum = (blue[bgr[0]] + green[bgr[1]] + red[bgr[2]]) >> kFraction;
+    sum &= ~(sum >> 31);
+    const Four most = Four{255, 255, 255, 255};
+    sum = sum > most ? most : sum;
+    return __builtin_convertvector(sum, FourBytes);
+  };
+  // The fourth byte of a pixel's store is the next pixel's, which is read first.
+  for (; pixels > 1; --pixels, bgr += 3) {
+    FourBytes color = mixed();
+    color[3] = bgr[3];
+    std::memcpy(bgr, &color, 4);
+  }
+  if (pixels == 0) return;
+  const FourBytes last = mixed();
+  std::memcpy(bgr, &last, 3);
+}
+
+constexpr MixMatrix kSame = {{{1, 0, 0, 0}, {0, 1, 0, 0}, {0, 0, 1, 0}}};
+constexpr MixMatrix kGray = {{{0.299, 0.587, 0.114, 0}, {0.299, 0.587, 0.114, 0}, {0.299, 0.587, 0.114, 0}}};
+constexpr MixMatrix kSepia = {{{0.393, 0.769, 0.189, 0}, {0.349, 0.686, 0.168, 0}, {0.272, 0.534, 0.131, 0}}};
+
+// from + (to - from) share.
+MixMatrix Between(const MixMatrix& from, const MixMatrix& to, double share) {
+  MixMatrix matrix;
+  for (size_t row = 0; row < 3; ++row) {
+    for (size_t i = 0; i < 4; ++i) matrix[row][i] = from[row][i] + (to[row][i] - from[row][i]) * share;
+  }
+  return matrix;
+}
+
+// Calls a function from color to color for each pixel.
+template <typename Function>
+PointEffect EachColor(Function function) {
+  PointEffect effect;
+  effect.colors = [=](uint8_t* bgr, size_t pixels) {
+    for (size_t i = 0; i < pixels; ++i, bgr += 3) function(bgr);
+  };
+  return effect;
+}
+
+// A hue is a place on a circle of six sectors. In each, one channel is the largest, one the smallest, and one rises or falls
+// between them. The places of those channels, blue 0, green 1, red 2.
+struct Sector {
+  uint8_t largest, between, smallest;
+  bool rises;
+};
+constexpr Sector kSectors[6] = {{2, 1, 0, true}, {1, 2, 0, false}, {1, 0, 2, true},
+                                {0, 1, 2, false}, {0, 2, 1, true}, {2, 0, 1, false}};
+
+int SectorOf(const uint8_t* bgr) {
+  const uint8_t b = bgr[0], g = bgr[1], r = bgr[2];
+  if (r >= g && g >= b) return 0;
+  if (g > r && r >= b) return 1;
+  if (g >= b && b > r) return 2;
+  if (b > g && g > r) return 3;
+  if (b > r && r >= g) return 4;
+  return 5;
+}
+
+// `turn`: sectors, 0 to 6. No division: places on the circle are counted in units of the pixel's own chroma.
+void TurnHue(uint8_t* bgr, double turn) {
+  const int from = SectorOf(bgr);
+  const Sector& old = kSectors[from];
+  const int32_t most = bgr[old.largest], least = bgr[old.smallest], between = bgr[old.between], chroma = most - least;
+  if (chroma == 0) return;
+  const double place = turn * chroma + (old.rises ? between - least : most - between);
+  auto sectors = static_cast<int32_t>(turn);
+  if (place >= (sectors + 1) * chroma) ++sectors;
+  const double rest = place - sectors * chroma;
+  const Sector& next = kSectors[(from + sectors) % 6];
+  bgr[next.largest] = static_cast<uint8_t>(most);
+  bgr[next.smallest] = static_cast<uint8_t>(least);
+  bgr[next.between] = RoundedLevel((next.rises ? least + rest : most - rest) + 1e-9);
+}
+
+}  // namespace
+
+PointEffect MixEffect(const MixMatrix& matrix) {
+  const auto tables = std::make_shared<MixTables>();
+  const double one = 1 << kFraction;
+  for (size_t old = 0; old < 3; ++old) {
+    for (int32_t v = 0; v < 256; ++v) {
+      Four& part = tables->parts[old][static_cast<size_t>(v)];
+      part = Four{};
+      for (size_t made = 0; made < 3; ++made) {
+        const std::array<double, 4>& row = matrix[2 - made];
+        const double rounding = old == 0 ? (row[3] + 0.5) * one + kTieBias : 0;
+        part[static_cast<int>(made)] = static_cast<int32_t>(std::lround(row[2 - old] * v * one + rounding));
+      }
+    }
+  }
+  PointEffect effect;
+  effect.colors = [tables](uint8_t* bgr, size_t pixels) { ApplyMix(*tables, bgr, pixels); };
+  return effect;
+}
+
+PointEffect GrayEffect() { return MixEffect(kGray); }
+PointEffect SaturationEffect(double share) { return MixEffect(Between(kGray, kSame, share)); }
+PointEffect SepiaEffect(double share) { return MixEffect(Between(kSame, kSepia, share)); }
+
+PointEffect KeepEffect(KeptChannel channel) {
+  MixMatrix matrix{};
+  for (auto& row : matrix) row[static_cast<size_t>(channel)] = 1;
+  return MixEffect(matrix);
+}
+
+PointEffect SwapEffect(SwappedChannels channels) {
+  constexpr std::pair<uint8_t, uint8_t> kPlaces[] = {{2, 1}, {2, 0}, {1, 0}};
+  const auto [one, other] = kPlaces[static_cast<size_t>(channels)];
+  return EachColor([=](uint8_t* bgr) { std::swap(bgr[one], bgr[other]); });
+}
+
+PointEffect ThresholdEffect(int32_t t) {
+  return EachColor([limit = 1000 * t](uint8_t* bgr) {
+    bgr[0] = bgr[1] = bgr[2] = LumaThousandths(bgr[2], bgr[1], bgr[0]) >= limit ? 255 : 0;
+  });
+}
+
+PointEffect HueEffect(double degrees) {
+  double turn = std::fmod(degrees / 60, 6);
+  if (turn < 0) turn += 6;
+  return EachColor([turn](uint8_t* bgr) { TurnHue(bgr, turn); });
+}
+
+PointEffect ColorizeEffect(const BgrColor& color, const BgrColor& dark, const BgrColor& light) {
+  constexpr double kMiddle = 127.5;
+  std::array<BgrColor, 256> colors;
+  for (size_t v = 0; v < 256; ++v) {
+    for (size_t c = 0; c < 3; ++c) {
+      const auto level = static_cast<double>(v);
+      colors[v][c] = RoundedLevel(level <= kMiddle ? dark[c] + (color[c] - dark[c]) * level / kMiddle
+                                                   : color[c] + (light[c] - color[c]) * (level - kMiddle) / kMiddle);
+    }
+  }
+  return EachColor([colors](uint8_t* bgr) { std::memcpy(bgr, colors[Luma(bgr[2], bgr[1], bgr[0])].data(), 3); });
+}
+
+}  // namespace fotomill

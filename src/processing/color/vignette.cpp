@@ -1,0 +1,47 @@
+#include "processing/color/vignette.h"
+
+#include <algorithm>
+#include <cmath>
+
+#include "processing/promote.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr int32_t kLeastRows = 16;  // of a band
+
+// The square of a pixel's distance from the middle along one axis, 1/2 at the border.
+double SquareAcross(int32_t place, int32_t length) {
+  const double across = (place + 0.5 - length / 2.0) / (length / 2.0);
+  return across * across / 2;
+}
+
+}  // namespace
+
+Status ApplyVignette(PictureRecord& picture, const Vignette& vignette, const Work& work) {
+  if (picture.image.Empty()) return Status::EmptyImage;
+  RETURN_IF_BAD(PromotePicture(picture));
+  const int32_t width = picture.image.Width();
+  platform::MemoryBlock block;
+  if (!block.Allocate(static_cast<uint64_t>(width) * sizeof(double))) return Status::MemoryAllocationError;
+  double* const across = block.Items<double>().data();
+  for (int32_t x = 0; x < width; ++x) across[x] = SquareAcross(vignette.left + x, vignette.whole.width);
+  const double untouched = vignette.size * vignette.size;
+  return ForBands(picture.image.Height(), kLeastRows, work, [&](int32_t first, int32_t end) {
+    for (int32_t y = first; y < end; ++y) {
+      const double down = SquareAcross(vignette.top + y, vignette.whole.height);
+      uint8_t* bgr = picture.image.Row(y).data();
+      for (int32_t x = 0; x < width; ++x, bgr += 3) {
+        const double square = across[x] + down;
+        if (square <= untouched) continue;
+        const double s = std::min((std::sqrt(square) - vignette.size) / (1 - vignette.size), 1.0);
+        const double share = vignette.amount * s * s * (3 - 2 * s);
+        for (size_t c = 0; c < 3; ++c) bgr[c] = RoundedLevel(bgr[c] + (vignette.color[c] - bgr[c]) * share);
+      }
+    }
+    return Status::Ok;
+  });
+}
+
+}  // namespace fotomill
