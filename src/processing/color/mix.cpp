@@ -1,10 +1,15 @@
 #include "processing/color/mix.h"
 
 #include <algorithm>
+#include <bit>
 #include <cmath>
 #include <cstring>
 #include <memory>
 #include <utility>
+
+#ifdef __SSE2__
+#include <emmintrin.h>
+#endif
 
 namespace fotomill {
 
@@ -16,31 +21,42 @@ constexpr int32_t kFraction = 20;
 constexpr double kTieBias = 2;
 
 using Four [[gnu::vector_size(16)]] = int32_t;
-using FourBytes [[gnu::vector_size(4)]] = uint8_t;
 
-// What each value of each old channel adds to the new blue, green and red.
+// What each value of each old channel adds to the new blue, green and red; the fourth number is 0.
 struct MixTables {
   std::array<std::array<Four, 256>, 3> parts;  // of old blue, green, red
 };
 
+// The whole part of each sum, clamped to 0 to 255, from the lowest byte up.
+uint32_t Packed(Four sums) {
+  const Four levels = sums >> kFraction;
+#ifdef __SSE2__
+  __m128i packed;
+  std::memcpy(&packed, &levels, sizeof packed);
+  packed = _mm_packs_epi32(packed, packed);
+  return static_cast<uint32_t>(_mm_cvtsi128_si32(_mm_packus_epi16(packed, packed)));
+#else
+  uint32_t packed = 0;
+  for (int i = 0; i < 3; ++i) packed |= static_cast<uint32_t>(std::clamp(levels[i], 0, 255)) << (8 * i);
+  return packed;
+#endif
+}
+
 void ApplyMix(const MixTables& tables, uint8_t* bgr, size_t pixels) {
   const Four *blue = tables.parts[0].data(), *green = tables.parts[1].data(), *red = tables.parts[2].data();
-  const auto mixed = [&] {
-    Four sum = (blue[bgr[0]] + green[bgr[1]] + red[bgr[2]]) >> kFraction;
-    sum &= ~(sum >> 31);
-    const Four most = Four{255, 255, 255, 255};
-    sum = sum > most ? most : sum;
-    return __builtin_convertvector(sum, FourBytes);
-  };
-  // The fourth byte of a pixel's store is the next pixel's, which is read first.
-  for (; pixels > 1; --pixels, bgr += 3) {
-    FourBytes color = mixed();
-    color[3] = bgr[3];
-    std::memcpy(bgr, &color, 4);
+  const auto mixed = [&](const uint8_t* from) { return Packed(blue[from[0]] + green[from[1]] + red[from[2]]); };
+  const auto store = [](uint8_t* to, uint32_t value) { std::memcpy(to, &value, sizeof value); };
+  constexpr bool kLowestFirst = std::endian::native == std::endian::little;
+  for (; kLowestFirst && pixels >= 4; pixels -= 4, bgr += 12) {  // four pixels are three whole numbers
+    const uint32_t a = mixed(bgr), b = mixed(bgr + 3), c = mixed(bgr + 6), d = mixed(bgr + 9);
+    store(bgr, a | b << 24);
+    store(bgr + 4, b >> 8 | c << 16);
+    store(bgr + 8, c >> 16 | d << 8);
   }
-  if (pixels == 0) return;
-  const FourBytes last = mixed();
-  std::memcpy(bgr, &last, 3);
+  for (; pixels > 0; --pixels, bgr += 3) {
+    const uint32_t color = mixed(bgr);
+    for (int c = 0; c < 3; ++c) bgr[c] = static_cast<uint8_t>(color >> (8 * c));
+  }
 }
 
 constexpr MixMatrix kSame = {{{1, 0, 0, 0}, {0, 1, 0, 0}, {0, 0, 1, 0}}};
