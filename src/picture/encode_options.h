@@ -18,6 +18,8 @@ struct EncodeOptions {
   int32_t hdpCompression = 10;                      // HDPCompression: quantizer, 0 to 255; 0 loses nothing
   int32_t hdpBits = 0;                              // HDPWriteOptions
   int32_t iconCompression = choice::kIconPng256;    // ICOCompression
+  bool iffCompressed = true;                         // CreateIffCompressed
+  bool iffPacked = false;                            // CreateIffPBM
   int32_t jpegQuality = 75;                         // JpegCompression, 1 to 100
   int32_t jpegSubsampling = choice::kSubsample420;  // JpegSubsample
   bool jpegProgressive = false;                     // WriteJpegProgressive

@@ -39,6 +39,8 @@ EncodeOptions EncodeOptionsFromSettings() {
           .hdpCompression = settings.HDPCompression,
           .hdpBits = settings.HDPWriteOptions,
           .iconCompression = settings.ICOCompression,
+          .iffCompressed = settings.CreateIffCompressed != 0,
+          .iffPacked = settings.CreateIffPBM != 0,
           .jpegQuality = settings.JpegCompression,
           .jpegSubsampling = settings.JpegSubsample,
           .jpegProgressive = settings.WriteJpegProgressive != 0,

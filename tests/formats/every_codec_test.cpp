@@ -36,6 +36,7 @@ constexpr Keeping kKeepings[] = {
     {"JPE", Keeps::Size}, {"JFI", Keeps::Size},
     {"JFIF", Keeps::Size},  {"WEBP", Keeps::Size},
     {"HDP", Keeps::Size},   {"WDP", Keeps::Size},
+    {"HAM", Keeps::Size},                           // hold and modify
 };
 // clang-format on
 

@@ -5,61 +5,24 @@
 #include <algorithm>
 #include <cstdlib>
 #include <functional>
-#include <memory>
 #include <vector>
 
-#include "core/byte_reader.h"
 #include "core/workers/share_out.h"
+#include "processing/color/color_profile.h"
 
 // The library works on whole pixels in the order of a packed image. It is told to keep no last color in a transform, so
 // that threads can share one.
-//
-// Profiles come with pictures from anywhere. Those of an unlikely size are left alone, and so are the tags of type 'mpet': a
-// file of a few megabytes can ask for a chain of a million steps there, which would keep a core busy for hours. All other
-// tags take a time that the library bounds, and hardly any profile has only those.
 
 namespace fotomill {
 
 namespace {
 
-constexpr uint64_t kLargestProfile = 8 << 20;
-constexpr uint32_t kMostTags = 100;           // as many as the library reads
-constexpr uint64_t kHeaderSize = 128;         // of a profile; the tag table follows: count, then name, offset, size of each
-constexpr uint32_t kStepsType = 0x6d706574;   // "mpet"
-constexpr uint8_t kHiddenTag = 'x';           // begins no name of a tag
 constexpr uint64_t kPixelsPerBand = 1 << 18;  // fewer are not worth a thread
 constexpr int32_t kUnseen = 1;                // a difference of 8-bit values that rounding may make
 
-struct CloseProfile {
-  void operator()(void* profile) const { cmsCloseProfile(profile); }
-};
-using Profile = std::unique_ptr<void, CloseProfile>;
-
-// The profile's bytes without the tags that are not trusted; empty when it is none.
-std::vector<uint8_t> TrustedTags(std::span<const uint8_t> profile) {
-  if (profile.size() > kLargestProfile) return {};
-  std::vector<uint8_t> trusted(profile.begin(), profile.end());
-  ByteReader table(profile);
-  table.Seek(kHeaderSize);
-  const uint32_t count = table.Be32();
-  if (!table.Ok() || count > kMostTags) return {};
-  for (uint32_t i = 0; i < count; ++i) {
-    const uint64_t entry = table.Position();
-    table.Skip(4);
-    ByteReader tag(profile);
-    tag.Seek(table.Be32());
-    table.Skip(4);
-    if (!table.Ok()) return {};
-    if (tag.Be32() == kStepsType) trusted[entry] = kHiddenTag;
-  }
-  return trusted;
-}
-
 // Null for bytes that are no profile of devices with RGB or gray colors.
 Profile OpenProfile(std::span<const uint8_t> bytes) {
-  const std::vector<uint8_t> trusted = TrustedTags(bytes);
-  if (trusted.empty()) return nullptr;
-  Profile profile(cmsOpenProfileFromMem(trusted.data(), static_cast<cmsUInt32Number>(trusted.size())));
+  Profile profile = OpenTrustedProfile(bytes);
   if (profile == nullptr) return nullptr;
   constexpr cmsProfileClassSignature kDevices[] = {cmsSigInputClass, cmsSigDisplayClass, cmsSigOutputClass,
                                                    cmsSigColorSpaceClass};

@@ -1,0 +1,36 @@
+#pragma once
+
+#include <cstdint>
+#include <span>
+#include <vector>
+
+#include "formats/pict/pict_file.h"
+#include "picture/palette.h"
+
+namespace fotomill {
+
+// The stored rows of a picture's pixels, from the top down. Not for JPEG.
+class PictRowDecoder {
+ public:
+  explicit PictRowDecoder(const PictPixels& pixels);
+
+  // Unpacks the next row. FileReadError when its code ends early.
+  Status Next();
+  // The row: indices of `bits` bits each, or blue, green, red.
+  std::span<const uint8_t> Indices() const { return raw_; }
+  std::span<const uint8_t> Colors();
+
+  const Palette& Colormap() const { return palette_; }
+
+ private:
+  Status NextPacked();
+  void SetPalette();
+
+  const PictPixels& pixels_;
+  std::span<const uint8_t> data_;
+  std::vector<uint8_t> raw_;  // one row as it was before packing
+  std::vector<uint8_t> bgr_;
+  Palette palette_{};
+};
+
+}  // namespace fotomill

@@ -1,0 +1,32 @@
+#include "formats/rows.h"
+
+#include "formats/pict/pict.h"
+
+namespace fotomill {
+
+namespace {
+
+using namespace std::string_view_literals;
+
+constexpr Signature kSignatures[] = {{10, "\0\x11\x02\xff"sv, "a Macintosh picture"}};
+
+constexpr FormatEntry kRows[] = {{
+    .details = PictDetails,
+    .info = PictInfo,
+    .read = PictRead,
+    .write = PictWrite,
+    .maxBits = 24,
+    .extension = "PCT"sv,
+    .description = "(PCT) Macintosh PICT"sv,
+    .enabled = 1,
+    .flags = FMT_BITMAP | FMT_SECONDARY,
+    .canRead = true,
+    .canWrite = true,
+    .signatures = kSignatures,
+}};
+
+}  // namespace
+
+std::span<const FormatEntry> PictRows() { return kRows; }
+
+}  // namespace fotomill

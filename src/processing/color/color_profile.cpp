@@ -1,0 +1,53 @@
+#include "processing/color/color_profile.h"
+
+#include <lcms2.h>
+
+#include <vector>
+
+#include "core/byte_reader.h"
+
+// Profiles of an unlikely size are left alone, and so are the tags of type 'mpet': a file of a few megabytes can ask for a
+// chain of a million steps there, which would keep a core busy for hours. All other tags take a time that the library
+// bounds, and hardly any profile has only those.
+
+namespace fotomill {
+
+namespace {
+
+constexpr uint64_t kLargestProfile = 8 << 20;
+constexpr uint32_t kMostTags = 100;          // as many as the library reads
+constexpr uint64_t kHeaderSize = 128;        // of a profile; the tag table follows: count, then name, offset, size of each
+constexpr uint32_t kStepsType = 0x6d706574;  // "mpet"
+constexpr uint8_t kHiddenTag = 'x';          // begins no name of a tag
+
+// The profile's bytes without the tags that are not trusted; empty when it is none.
+std::vector<uint8_t> TrustedTags(std::span<const uint8_t> profile) {
+  if (profile.size() > kLargestProfile) return {};
+  std::vector<uint8_t> trusted(profile.begin(), profile.end());
+  ByteReader table(profile);
+  table.Seek(kHeaderSize);
+  const uint32_t count = table.Be32();
+  if (!table.Ok() || count > kMostTags) return {};
+  for (uint32_t i = 0; i < count; ++i) {
+    const uint64_t entry = table.Position();
+    table.Skip(4);
+    ByteReader tag(profile);
+    tag.Seek(table.Be32());
+    table.Skip(4);
+    if (!table.Ok()) return {};
+    if (tag.Be32() == kStepsType) trusted[entry] = kHiddenTag;
+  }
+  return trusted;
+}
+
+}  // namespace
+
+void CloseProfile::operator()(void* profile) const { cmsCloseProfile(profile); }
+
+Profile OpenTrustedProfile(std::span<const uint8_t> bytes) {
+  const std::vector<uint8_t> trusted = TrustedTags(bytes);
+  if (trusted.empty()) return nullptr;
+  return Profile(cmsOpenProfileFromMem(trusted.data(), static_cast<cmsUInt32Number>(trusted.size())));
+}
+
+}  // namespace fotomill
