@@ -85,6 +85,36 @@ class Assembly {
 
 }  // namespace
 
+JpegWalk::JpegWalk(WalkedBytes file) : file_(file) {
+  if (!ByteReader(file_.At(0, 2)).Match("\xFF\xD8")) End(Status::DamagedFile);
+}
+
+bool JpegWalk::Next(JpegPlace& segment) {
+  if (ended_) return false;
+  uint64_t last = next_;  // of the fill bytes, which is the marker's own
+  auto bytes = file_.At(last, WalkedBytes::kMost);
+  if (!bytes.empty() && bytes[0] != 0xFF) return End(Status::DamagedFile);
+  while (bytes.size() > 1 && bytes[1] == 0xFF) bytes = file_.At(++last, WalkedBytes::kMost);
+  ByteReader head(bytes);
+  head.Skip(1);
+  const uint8_t marker = head.U8();
+  if (!head.Ok()) return End(Status::FileReadError);
+  if (marker == 0 || marker == kEnd) return End(Status::DamagedFile);
+  if (marker == kScan) return End(Status::Ok);
+  const uint16_t length = StandsAlone(marker) ? 0 : head.Be16();
+  if (!head.Ok()) return End(Status::FileReadError);
+  if (!StandsAlone(marker) && length < 2) return End(Status::DamagedFile);
+  segment = {marker, next_, last + head.Position(), last + 2 + length, head.Peek(head.Left())};
+  next_ = segment.end;
+  return true;
+}
+
+bool JpegWalk::End(Status outcome) {
+  ended_ = true;
+  outcome_ = outcome;
+  return false;
+}
+
 bool JpegSegment::Starts(std::string_view head) const { return ByteReader(data).Match(head); }
 
 std::span<const uint8_t> JpegHead::Exif() const {
@@ -109,29 +139,14 @@ bool JpegHead::HasMorePictures() const {
 
 Status ParseJpegHead(std::span<const uint8_t> file, JpegHead& head) {
   head = {};
-  ByteReader bytes(file);
-  if (!bytes.Match("\xFF\xD8")) return Status::DamagedFile;
-  while (bytes.Ok()) {
-    const uint64_t start = bytes.Position();
-    if (bytes.U8() != 0xFF) return bytes.Ok() ? Status::DamagedFile : Status::FileReadError;
-    uint8_t marker = 0xFF;
-    while (marker == 0xFF && bytes.Ok()) marker = bytes.U8();
-    if (marker == 0 || marker == kEnd) return Status::DamagedFile;
-    if (marker == kScan) {
-      head.scan = start;
-      return bytes.Ok() ? Status::Ok : Status::FileReadError;
-    }
-    JpegSegment segment{.marker = marker, .data = {}, .whole = {}};
-    if (!StandsAlone(marker)) {
-      const uint16_t length = bytes.Be16();
-      if (length < 2 && bytes.Ok()) return Status::DamagedFile;
-      segment.data = bytes.Take(length < 2 ? 0u : length - 2u);
-    }
-    if (!bytes.Ok()) break;
-    segment.whole = file.subspan(start, bytes.Position() - start);
-    head.segments.push_back(segment);
+  JpegWalk walk(file);
+  for (JpegPlace place; walk.Next(place);) {
+    if (place.end > file.size()) return Status::FileReadError;
+    const auto from = [&](uint64_t begin) { return file.subspan(begin, place.end - begin); };
+    head.segments.push_back({place.marker, from(place.data), from(place.start)});
   }
-  return Status::FileReadError;
+  head.scan = walk.Position();
+  return walk.Outcome();
 }
 
 Status AssembleJpeg(std::span<const uint8_t> file, const JpegHead& head, const JpegParts& parts, std::vector<uint8_t>& made) {

@@ -6,6 +6,7 @@
 #include <string_view>
 #include <vector>
 
+#include "containers/walked_bytes.h"
 #include "core/status.h"
 
 namespace fotomill {
@@ -16,6 +17,35 @@ inline constexpr std::string_view kExifHead("Exif\0\0", 6);
 inline constexpr std::string_view kXmpHead("http://ns.adobe.com/xap/1.0/\0", 29);
 inline constexpr size_t kMostSegment = 65533;  // data of one segment
 inline constexpr size_t kMostExif = kMostSegment - 6, kMostXmp = kMostSegment - 29;
+
+// Where a segment is in its file; it may claim more than there is.
+struct JpegPlace {
+  uint8_t marker = 0;
+  uint64_t start = 0, data = 0, end = 0;  // fill bytes in front belong to it
+  std::span<const uint8_t> first;         // 12 bytes from `data` on or what there is; until the next segment
+};
+
+// Walks the segments of a file up to its first scan.
+class JpegWalk {
+ public:
+  explicit JpegWalk(WalkedBytes file);
+  // The next segment; false at the end.
+  bool Next(JpegPlace& segment);
+  // Where the walk stands, and why it ended: Ok at a scan; DamagedFile (2) at what is no segment;
+  // FileReadError (3) where the file ends.
+  uint64_t Position() const { return next_; }
+  Status Outcome() const { return outcome_; }
+  // Whether it ended because reading failed.
+  bool ReadFailed() const { return file_.Failed(); }
+
+ private:
+  bool End(Status outcome);
+
+  WalkedBytes file_;
+  uint64_t next_ = 2;
+  bool ended_ = false;
+  Status outcome_ = Status::Ok;
+};
 
 // The head of a JPEG file: the segments in front of the first scan. All spans are into the file.
 struct JpegSegment {

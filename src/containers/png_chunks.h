@@ -4,39 +4,57 @@
 #include <span>
 #include <string_view>
 
-#include "core/byte_reader.h"
+#include "containers/walked_bytes.h"
+#include "core/status.h"
 
 namespace fotomill {
 
-// One chunk of a PNG file: length (4 bytes), type (4), data, CRC (4), all big-endian.
+inline constexpr std::string_view kPngSignature("\x89PNG\r\n\x1a\n", 8);
+
+// Where a chunk is in its file; it may claim more than there is.
+struct PngPlace {
+  std::string_view type;  // until the next chunk, where the file is not in memory
+  uint64_t data = 0, size = 0;
+  uint64_t End() const { return data + size + 4; }  // behind the CRC
+};
+
+// Walks the chunks of a file from its signature to IEND, the last one. CRCs are not checked.
+class PngWalk {
+ public:
+  explicit PngWalk(WalkedBytes file);
+  // The next chunk; false at the end.
+  bool Next(PngPlace& chunk);
+  // Why the walk ended: Ok behind IEND; DamagedFile (2) at what is no chunk; FileReadError (3)
+  // where the file ends.
+  Status Outcome() const { return outcome_; }
+  // Whether it ended because reading failed.
+  bool ReadFailed() const { return file_.Failed(); }
+
+ private:
+  bool End(Status outcome);
+
+  WalkedBytes file_;
+  uint64_t next_ = 0;
+  bool ended_ = false;
+  Status outcome_ = Status::Ok;
+};
+
+// One chunk of a file in memory.
 struct PngChunk {
   std::string_view type;
   std::span<const uint8_t> data;
 };
 
-// Walks the chunks of a file from its signature to IEND or to where it is cut short.
+// Walks the chunks of a file in memory as far as they are whole.
 class PngChunks {
  public:
-  explicit PngChunks(std::span<const uint8_t> file) : bytes_(file) { valid_ = bytes_.Match("\x89PNG\r\n\x1a\n"); }
-  // Whether the file is a PNG at all.
-  bool HasSignature() const { return valid_; }
-  // The next chunk; false at the end. CRCs are not checked.
-  bool Next(PngChunk& chunk) {
-    if (!valid_ || ended_) return false;
-    const uint32_t size = bytes_.Be32();
-    const auto type = bytes_.Take(4);
-    chunk.data = bytes_.Take(size);
-    bytes_.Skip(4);
-    if (!bytes_.Ok()) return false;
-    chunk.type = std::string_view(reinterpret_cast<const char*>(type.data()), 4);
-    ended_ = chunk.type == "IEND";
-    return true;
-  }
+  explicit PngChunks(std::span<const uint8_t> file) : file_(file), walk_(file) {}
+  // The next chunk; false at the end.
+  bool Next(PngChunk& chunk);
 
  private:
-  ByteReader bytes_;
-  bool valid_ = false;
-  bool ended_ = false;
+  std::span<const uint8_t> file_;
+  PngWalk walk_;
 };
 
 }  // namespace fotomill

@@ -15,6 +15,7 @@ struct Limits {
   uint32_t exifValueCharacters = 4096;            // text of one value
   uint64_t exifTextBytes = uint64_t{4} << 20;     // text of one block
   uint32_t animationFrames = 1 << 20;             // frames of one animation; those behind are not shown
+  uint32_t walkedPlaces = 65536;                  // places read beyond a file's head in search of its EXIF
   uint64_t metadataBytes = uint64_t{64} << 20;    // one EXIF, XMP or ICC block kept with a picture
 };
 

@@ -76,23 +76,18 @@ struct PngLayout {
 };
 
 // Whether the chunks in front of the pixels lie in the file: for one that only claims a size the library would make room.
-bool HeadLiesInFile(std::span<const uint8_t> file) {
-  constexpr uint64_t kSignature = 8, kTypeAndCrc = 8;
-  ByteReader bytes(file);
-  bytes.Skip(kSignature);
-  while (bytes.Ok()) {
-    const uint32_t size = bytes.Be32();
-    if (bytes.Match("IDAT")) return true;
-    bytes.Skip(kTypeAndCrc + size);
+Status CheckHead(std::span<const uint8_t> file) {
+  PngWalk walk(file);
+  for (PngPlace chunk; walk.Next(chunk);) {
+    if (chunk.type == "IDAT") return Status::Ok;
   }
-  return false;
+  return walk.Outcome() == Status::DamagedFile ? Status::DamagedFile : Status::FileReadError;
 }
 
 // Reads everything before the pixels and sets up the conversions.
 Status ReadHeader(PngReader& reader) {
   if (!reader.Ready()) return Status::MemoryAllocationError;
-  if (png_sig_cmp(reader.bytes.Peek(8).data(), 0, reader.bytes.Peek(8).size()) != 0) return Status::DamagedFile;
-  if (!HeadLiesInFile(reader.file)) return Status::FileReadError;
+  RETURN_IF_BAD(CheckHead(reader.file));
   const bool read = PngGuarded(reader.png, [&] {
     png_set_read_fn(reader.png, &reader, ReadBytes);
     png_set_user_limits(reader.png, kMostSide, kMostSide);

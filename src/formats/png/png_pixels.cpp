@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "containers/png_chunks.h"
+#include "core/byte_reader.h"
 #include "core/limits.h"
 #include "formats/png/png_filter.h"
 

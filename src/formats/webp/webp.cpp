@@ -23,6 +23,8 @@
 #include <string_view>
 #include <vector>
 
+#include "containers/jpeg_segments.h"
+#include "containers/riff_chunks.h"
 #include "core/byte_reader.h"
 #include "core/byte_writer.h"
 #include "core/limits.h"
@@ -33,11 +35,9 @@ namespace fotomill {
 namespace {
 
 constexpr uint8_t kXmpFlag = 4, kExifFlag = 8, kAlphaFlag = 16, kIccFlag = 32;
-constexpr uint64_t kFileHead = 12;
 constexpr uint8_t kClearAfterwards = 1, kReplace = 2;  // flags of a frame: what becomes of it, and how it is put there
 constexpr size_t kMostFrames = 1 << 16;
-constexpr int kLossy = 1, kLossless = 2;              // WebPBitstreamFeatures::format
-constexpr std::string_view kExifHead("Exif\0\0", 6);  // some programs put it in front, as in JPEG
+constexpr int kLossy = 1, kLossless = 2;  // WebPBitstreamFeatures::format
 
 struct WebpFrame {
   int32_t left = 0, top = 0;  // on the canvas
@@ -87,19 +87,14 @@ void TakeFrame(std::span<const uint8_t> chunk, WebpFile& file) {
 
 // The chunks beside the pixels. A chunk that is cut short is taken as far as it goes: the library tells what is missing.
 void WalkChunks(std::span<const uint8_t> data, WebpFile& file) {
-  ByteReader bytes(data);
-  bytes.Skip(kFileHead);
-  while (bytes.Left() >= 8) {
-    const auto name = bytes.Take(4);
-    const uint64_t length = bytes.Le32();
-    const auto chunk = bytes.Take(std::min<uint64_t>(length, bytes.Left()));
-    const auto is = [&](const char* wanted) { return std::memcmp(name.data(), wanted, 4) == 0; };
-    if (is("ANIM") && chunk.size() >= 6) file.loops = static_cast<uint16_t>(chunk[4] | chunk[5] << 8);
-    if (is("ANMF")) TakeFrame(chunk, file);
-    if (is("ICCP")) file.icc = chunk;
-    if (is("EXIF")) file.exif = chunk;
-    if (is("XMP ")) file.xmp = chunk;
-    bytes.Skip(std::min<uint64_t>(length % 2, bytes.Left()));
+  RiffWalk walk(data);
+  for (RiffPlace place; walk.Next(place);) {
+    const auto chunk = data.subspan(place.data, place.size);
+    if (place.name == "ANIM" && chunk.size() >= 6) file.loops = static_cast<uint16_t>(chunk[4] | chunk[5] << 8);
+    if (place.name == "ANMF") TakeFrame(chunk, file);
+    if (place.name == "ICCP") file.icc = chunk;
+    if (place.name == "EXIF") file.exif = chunk;
+    if (place.name == "XMP ") file.xmp = chunk;
   }
 }
 
@@ -116,8 +111,8 @@ Status MeasureFrame(WebpFile& file, WebpFrame& frame) {
 }
 
 Status ParseFile(std::span<const uint8_t> data, WebpFile& file) {
-  if (data.size() < kFileHead) return Status::FileReadError;
-  if (std::memcmp(data.data(), "RIFF", 4) != 0 || std::memcmp(data.data() + 8, "WEBP", 4) != 0) return Status::DamagedFile;
+  if (data.size() < kRiffHead) return Status::FileReadError;
+  if (!IsRiff(data, "WEBP")) return Status::DamagedFile;
   WebPBitstreamFeatures features;
   RETURN_IF_BAD(StatusOf(WebPGetFeatures(data.data(), data.size(), &features)));
   file.width = features.width;
@@ -154,8 +149,7 @@ void Describe(const WebpFile& file, PictureRecord& picture) {
   picture.imageBytes = EstimateImageBytes(file.width, file.height, 24);
   MakeDefaultPalette(&picture.palette, nullptr, kDisplayPalette);
   picture.metadata = {};
-  const bool headed =
-      file.exif.size() >= kExifHead.size() && std::memcmp(file.exif.data(), kExifHead.data(), kExifHead.size()) == 0;
+  const bool headed = ByteReader(file.exif).Match(kExifHead);  // some programs put it in front, as in JPEG
   Assign(picture.metadata.exif, headed ? file.exif.subspan(kExifHead.size()) : file.exif);
   Assign(picture.metadata.xmp, file.xmp);
   Assign(picture.metadata.icc, file.icc);
@@ -318,7 +312,7 @@ uint64_t ChunkBytes(uint64_t data) { return data == 0 ? 0 : 8 + data + data % 2;
 // The encoder's file, with the chunks of metadata around its pixels where there are any.
 void WriteFile(ByteWriter& out, const PictureRecord& picture, std::span<const uint8_t> encoded) {
   const PictureMetadata& metadata = picture.metadata;
-  const auto pixels = encoded.subspan(kFileHead);
+  const auto pixels = encoded.subspan(kRiffHead);
   const bool extended = pixels.size() >= 18 && std::memcmp(pixels.data(), "VP8X", 4) == 0;  // lossy with alpha
   const auto chunks = extended ? pixels.subspan(18) : pixels;
   const uint64_t length = 4 + 18 + chunks.size() + ChunkBytes(metadata.icc.size()) + ChunkBytes(metadata.exif.size()) +
@@ -405,7 +399,7 @@ Status WebpWrite(PictureRecord& picture, const WriteOptions& options) {
   const WebPMemoryWriter& chosen = useOther ? other.writer : encoded.writer;
   const std::span<const uint8_t> bytes(chosen.mem, chosen.size);
   const bool keep = options.KeepsMetadata() && !picture.metadata.Empty();
-  if (keep && bytes.size() > kFileHead) {
+  if (keep && bytes.size() > kRiffHead) {
     WriteFile(out, picture, bytes);
   } else {
     out.Bytes(bytes);

@@ -1,11 +1,12 @@
 #include "metadata/exif/exif_source.h"
 
 #include <algorithm>
-#include <array>
-#include <cstring>
 #include <string_view>
 #include <vector>
 
+#include "containers/jpeg_segments.h"
+#include "containers/png_chunks.h"
+#include "containers/riff_chunks.h"
 #include "core/byte_reader.h"
 #include "core/limits.h"
 #include "formats/hdphoto/hdp_file.h"
@@ -15,10 +16,6 @@ namespace fotomill {
 namespace {
 
 constexpr uint64_t kHeadSize = 16 * 1024;  // holds the directories of most pictures; the rest is read when needed
-constexpr std::string_view kExifMark("Exif\0\0", 6);
-constexpr std::string_view kPngSignature("\x89PNG\r\n\x1a\n", 8);
-constexpr size_t kPngChunkSize = 12;  // of an empty chunk: length, type, checksum
-constexpr int kMostParts = 65536;     // segments or chunks that are passed by in search of the block
 
 bool Starts(std::span<const uint8_t> bytes, std::string_view text) { return ByteReader(bytes).Match(text); }
 
@@ -47,8 +44,8 @@ Status ExifSource::Find(Place& place) const {
   const auto head = file_.Bytes();
   if (Starts(head, "\xFF\xD8")) return FindInJpeg(place);
   if (Starts(head, kPngSignature)) return FindInPng(place);
-  if (Starts(head, "RIFF") && head.size() >= 12 && Starts(head.subspan(8), "WEBP")) return FindInWebp(place);
-  if (StartsBareBlock(head) || Starts(head, kExifMark)) place = {0, file_.FileSize()};
+  if (IsRiff(head, "WEBP")) return FindInWebp(place);
+  if (StartsBareBlock(head) || Starts(head, kExifHead)) place = {0, file_.FileSize()};
   return Status::Ok;
 }
 
@@ -64,72 +61,37 @@ Status ExifSource::GatherFromHdp(const char* path) {
   return Status::Ok;
 }
 
-// Segments: 0xFF, a marker, for most of them a 16-bit size that counts itself.
 Status ExifSource::FindInJpeg(Place& place) const {
-  constexpr uint8_t kApp1 = 0xE1, kEndOfImage = 0xD9, kStartOfScan = 0xDA;
+  constexpr uint8_t kApp1 = 0xE1;
   const uint64_t fileSize = file_.FileSize();
-  uint64_t offset = 2;
-  for (int parts = 0; parts < kMostParts && offset + 4 <= fileSize; ++parts) {
-    std::array<uint8_t, 10> bytes{};
-    RETURN_IF_BAD(Fetch(offset, std::span(bytes).first(std::min<uint64_t>(bytes.size(), fileSize - offset))));
-    const uint8_t marker = bytes[1];
-    if (bytes[0] != 0xFF || marker == kEndOfImage || marker == kStartOfScan) break;
-    if (marker == 0xFF) {  // a fill byte
-      ++offset;
-      continue;
-    }
-    const bool alone = marker == 0x01 || (marker >= 0xD0 && marker <= 0xD8);
-    const uint64_t size = alone ? 0 : uint64_t{bytes[2]} << 8 | bytes[3];
-    if (!alone && size < 2) break;
-    if (marker == kApp1 && size >= 2 + kExifMark.size() && Starts(std::span(bytes).subspan(4), "Exif")) {
-      const uint64_t first = offset + 4 + kExifMark.size();
-      place = {first, std::min(offset + 2 + size, fileSize) - std::min(first, fileSize)};
-      break;
-    }
-    offset += 2 + size;
+  JpegWalk walk{WalkedBytes(file_)};
+  for (JpegPlace segment; walk.Next(segment);) {
+    const uint64_t block = segment.data + kExifHead.size();
+    if (segment.marker != kApp1 || segment.end < block || !Starts(segment.first, "Exif")) continue;
+    place = {block, std::min(segment.end, fileSize) - std::min(block, fileSize)};
+    break;
   }
-  return Status::Ok;
+  return walk.ReadFailed() ? Status::FileReadError : Status::Ok;
 }
 
 Status ExifSource::FindInPng(Place& place) const {
-  const uint64_t fileSize = file_.FileSize();
-  uint64_t offset = kPngSignature.size();
-  for (int parts = 0; parts < kMostParts && offset + kPngChunkSize <= fileSize; ++parts) {
-    std::array<uint8_t, 8> bytes{};
-    RETURN_IF_BAD(Fetch(offset, bytes));
-    const uint64_t size = ByteReader(bytes).Be32();
-    const auto type = std::span(bytes).subspan(4);
-    if (Starts(type, "eXIf")) {
-      place = {offset + bytes.size(), std::min(size, fileSize - offset - bytes.size())};
-      break;
-    }
-    if (Starts(type, "IEND")) break;
-    offset += kPngChunkSize + size;
+  PngWalk walk{WalkedBytes(file_)};
+  for (PngPlace chunk; walk.Next(chunk);) {
+    if (chunk.type != "eXIf") continue;
+    place = {chunk.data, std::min(chunk.size, file_.FileSize() - chunk.data)};
+    break;
   }
-  return Status::Ok;
+  return walk.ReadFailed() ? Status::FileReadError : Status::Ok;
 }
 
 Status ExifSource::FindInWebp(Place& place) const {
-  const uint64_t fileSize = file_.FileSize();
-  uint64_t offset = 12;
-  for (int parts = 0; parts < kMostParts && offset + 8 <= fileSize; ++parts) {
-    std::array<uint8_t, 8> bytes{};
-    RETURN_IF_BAD(Fetch(offset, bytes));
-    ByteReader header(bytes);
-    header.Skip(4);
-    const uint64_t size = header.Le32();
-    if (Starts(bytes, "EXIF")) {
-      place = {offset + bytes.size(), std::min(size, fileSize - offset - bytes.size())};
-      break;
-    }
-    offset += bytes.size() + size + size % 2;
+  RiffWalk walk{WalkedBytes(file_)};
+  for (RiffPlace chunk; walk.Next(chunk);) {
+    if (chunk.name != "EXIF") continue;
+    place = {chunk.data, chunk.size};
+    break;
   }
-  return Status::Ok;
-}
-
-// Bytes of the file, from the head where they are there.
-Status ExifSource::Fetch(uint64_t offset, std::span<uint8_t> into) const {
-  return file_.ReadAt(offset, into) ? Status::Ok : Status::FileReadError;
+  return walk.ReadFailed() ? Status::FileReadError : Status::Ok;
 }
 
 Status ExifSource::Take(const char* path, const Place& place) {
@@ -142,10 +104,10 @@ Status ExifSource::Take(const char* path, const Place& place) {
   } else {
     if (place.size > limits.metadataBytes) return Status::MemoryAllocationError;
     if (!copy_.Allocate(place.size, platform::Fill::Unset)) return Status::MemoryAllocationError;
-    RETURN_IF_BAD(Fetch(place.offset, copy_.Bytes()));
+    if (!file_.ReadAt(place.offset, copy_.Bytes())) return Status::FileReadError;
     block_ = copy_.Bytes();
   }
-  if (Starts(block_, kExifMark)) block_ = block_.subspan(kExifMark.size());
+  if (Starts(block_, kExifHead)) block_ = block_.subspan(kExifHead.size());
   return Status::Ok;
 }
 

@@ -39,7 +39,6 @@ class ExifSource {
   Status FindInPng(Place& place) const;
   Status FindInWebp(Place& place) const;
   Status GatherFromHdp(const char* path);
-  Status Fetch(uint64_t offset, std::span<uint8_t> into) const;
   Status Take(const char* path, const Place& place);
 
   platform::FileView file_;     // the head, or the whole of a TIFF file
