@@ -19,6 +19,7 @@
 #include "core/limits.h"
 #include "formats/hdphoto/hdp_codec.h"
 #include "formats/hdphoto/hdp_file.h"
+#include "picture/gray_palette.h"
 #include "platform/file_view.h"
 
 namespace fotomill {
@@ -211,16 +212,6 @@ int32_t BitsOf(const HdpPage& page) {
   return page.image.depth == HdpDepth::WhiteIsOne || page.image.depth == HdpDepth::BlackIsOne ? 1 : 8;
 }
 
-void TakePalette(int32_t bits, Palette& palette) {
-  if (bits == 24) {
-    MakeDefaultPalette(&palette, nullptr, kDisplayPalette);
-    return;
-  }
-  const int levels = 1 << bits;
-  palette.fill(0);
-  for (int i = 0; i < levels; ++i) std::fill_n(palette.begin() + 3 * i, 3, static_cast<uint8_t>(i * 255 / (levels - 1)));
-}
-
 void Assign(std::vector<uint8_t>& block, std::span<const uint8_t> data) {
   block.clear();
   if (data.size() <= limits.metadataBytes) block.assign(data.begin(), data.end());
@@ -250,7 +241,11 @@ Status Describe(std::span<const uint8_t> file, int32_t index, HdpPage& page, Pic
   picture.simplified = page.image.depth != HdpDepth::U8 || page.image.colors >= HdpColors::Cmyk;
   picture.alphaFlags = static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (HasAlpha(page) ? kHasAlpha : 0));
   picture.imageBytes = EstimateImageBytes(picture.width, picture.height, picture.bitsPerPixel);
-  TakePalette(picture.bitsPerPixel, picture.palette);
+  if (picture.bitsPerPixel == 24) {
+    MakeDefaultPalette(&picture.palette, nullptr, kDisplayPalette);
+  } else {
+    picture.palette = GrayLevels(picture.bitsPerPixel);
+  }
   TakeMetadata(file, page, picture);
   return Status::Ok;
 }

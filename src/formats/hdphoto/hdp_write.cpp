@@ -9,6 +9,7 @@
 #include "formats/hdphoto/hdp.h"
 #include "formats/hdphoto/hdp_codec.h"
 #include "formats/hdphoto/hdp_file.h"
+#include "picture/gray_palette.h"
 #include "processing/promote.h"
 
 namespace fotomill {
@@ -75,15 +76,6 @@ class Directory {
   std::vector<Entry> entries_;
 };
 
-bool IsGray(const PictureRecord& picture) {
-  const int colors = picture.image.Colors();
-  for (int i = 0; i < colors; ++i) {
-    const uint8_t* color = &picture.palette[3 * static_cast<size_t>(i)];
-    if (color[0] != color[1] || color[0] != color[2]) return false;
-  }
-  return colors > 0;
-}
-
 // The picture as 8-bit gray levels, or as 24-bit colors.
 Status MakeSource(const PictureRecord& picture, bool gray, PackedImage& source) {
   const PackedImage& image = picture.image;
@@ -141,7 +133,7 @@ Directory MakeDirectory(const PictureRecord& picture, const WriteOptions& option
 
 Status WriteAll(ByteWriter& out, PictureRecord& picture, const WriteOptions& options) {
   const bool keep = options.KeepsMetadata();
-  const bool gray = IsGray(picture);
+  const bool gray = HasOnlyGrays(picture.palette, picture.image.Colors());
   PackedImage source;
   RETURN_IF_BAD(MakeSource(picture, gray, source));
   // The EXIF directories stand in front, where their place is known, then the file's own.

@@ -29,6 +29,7 @@
 #include "core/choice_lists.h"
 #include "core/limits.h"
 #include "formats/jpeg/jpeg_library.h"
+#include "picture/gray_palette.h"
 #include "platform/file_view.h"
 
 namespace fotomill {
@@ -180,15 +181,6 @@ void TakeLastBuffer(j_compress_ptr info) {
   static_cast<ByteWriter*>(info->client_data)->Used(ByteWriter::kMostReserved - info->dest->free_in_buffer);
 }
 
-bool HasGrayPalette(const PictureRecord& picture) {
-  const size_t colors = static_cast<size_t>(picture.image.Colors());
-  for (size_t i = 0; i < colors; ++i) {
-    if (picture.palette[3 * i] != picture.palette[3 * i + 1] || picture.palette[3 * i] != picture.palette[3 * i + 2])
-      return false;
-  }
-  return colors > 0;
-}
-
 void SetSampling(jpeg_compress_struct& info, int32_t choice) {
   if (info.num_components != 3) return;
   info.comp_info[0].h_samp_factor = choice == choice::kSubsample444 ? 1 : 2;
@@ -277,7 +269,7 @@ void ExpandRow(const PictureRecord& picture, int32_t y, bool gray, std::vector<u
 
 Status WriteAll(JpegWriter& writer, PictureRecord& picture, const WriteOptions& options) {
   const PackedImage& image = picture.image;
-  const bool gray = HasGrayPalette(picture);
+  const bool gray = HasOnlyGrays(picture.palette, image.Colors());
   std::vector<uint8_t> expanded(image.Bits() == 24 ? 0 : (gray ? 1 : 3) * static_cast<size_t>(image.Width()));
   const bool written = Guarded(writer.errors, [&] {
     SetParameters(writer, picture, gray, options.encode);

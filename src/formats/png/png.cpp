@@ -25,6 +25,7 @@
 #include "core/limits.h"
 #include "formats/png/png_library.h"
 #include "formats/png/png_pixels.h"
+#include "picture/gray_palette.h"
 #include "platform/file_view.h"
 #include "processing/pixel_rows.h"
 
@@ -129,11 +130,11 @@ void TakePalette(const PngReader& reader, const PngLayout& layout, Palette& pale
     MakeDefaultPalette(&palette, nullptr, kDisplayPalette);
     return;
   }
-  palette.fill(0);
   png_colorp colors = nullptr;
   int count = 0;
   if (png_get_PLTE(reader.png, reader.info, &colors, &count) != 0 &&
       png_get_color_type(reader.png, reader.info) == PNG_COLOR_TYPE_PALETTE) {
+    palette.fill(0);
     for (int i = 0; i < count && i < 256; ++i) {
       const auto place = 3 * static_cast<size_t>(i);
       palette[place] = colors[i].red;
@@ -142,8 +143,7 @@ void TakePalette(const PngReader& reader, const PngLayout& layout, Palette& pale
     }
     return;
   }
-  const int levels = 1 << layout.bitsPerPixel;
-  for (int i = 0; i < 3 * levels; ++i) palette[static_cast<size_t>(i)] = static_cast<uint8_t>(i / 3 * 255 / (levels - 1));
+  palette = GrayLevels(layout.bitsPerPixel);
 }
 
 void Assign(std::vector<uint8_t>& block, const uint8_t* data, size_t size) {

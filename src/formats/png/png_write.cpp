@@ -9,6 +9,7 @@
 #include "formats/png/png.h"
 #include "formats/png/png_deflate.h"
 #include "formats/png/png_library.h"
+#include "picture/gray_palette.h"
 #include "processing/pixel_rows.h"
 #include "processing/promote.h"
 
@@ -39,11 +40,8 @@ void FlushNothing(png_structp) {}
 
 // Whether the palette is the gray ramp of its depth.
 bool IsGray(const Palette& palette, int32_t bits) {
-  const int levels = 1 << bits;
-  for (int i = 0; i < 3 * levels; ++i) {
-    if (palette[static_cast<size_t>(i)] != i / 3 * 255 / (levels - 1)) return false;
-  }
-  return true;
+  const Palette grays = GrayLevels(bits);
+  return std::equal(grays.begin(), grays.begin() + (3 << bits), palette.begin());
 }
 
 int ColorType(const PictureRecord& picture) {

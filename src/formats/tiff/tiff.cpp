@@ -30,6 +30,7 @@
 #include "formats/tiff/tiff_file.h"
 #include "formats/tiff/tiff_lzw.h"
 #include "formats/tiff/tiff_samples.h"
+#include "picture/gray_palette.h"
 #include "platform/file_view.h"
 #include "processing/pixel_rows.h"
 
@@ -170,12 +171,9 @@ void TakePalette(TIFF* tiff, const TiffLayout& layout, Palette& palette) {
     MakeDefaultPalette(&palette, nullptr, kDisplayPalette);
     return;
   }
-  const int levels = 1 << layout.bitsPerPixel;
-  const bool inverted = layout.photometric == PHOTOMETRIC_MINISWHITE;
-  palette.fill(0);
-  for (int i = 0; i < levels; ++i) {
-    const auto level = static_cast<uint8_t>((inverted ? levels - 1 - i : i) * 255 / (levels - 1));
-    std::fill_n(palette.begin() + 3 * i, 3, level);
+  palette = GrayLevels(layout.bitsPerPixel);
+  if (layout.photometric == PHOTOMETRIC_MINISWHITE) {
+    std::reverse(palette.begin(), palette.begin() + (3 << layout.bitsPerPixel));
   }
 }
 
