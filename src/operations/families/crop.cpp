@@ -1,8 +1,11 @@
 #include <algorithm>
 #include <cmath>
 
+#include "operations/area.h"
+#include "operations/backdrop.h"
 #include "operations/gravity.h"
 #include "operations/operations.h"
+#include "processing/geometry/canvas.h"
 #include "processing/geometry/cut.h"
 
 // Crop: what is cut off, and what is added around.
@@ -19,36 +22,55 @@ constexpr Parameter kCrop[] = {
      .help = "Which part to keep of an area without a place."},
 };
 
-int32_t Whole(double pixels) { return static_cast<int32_t>(std::floor(std::clamp(pixels, -2e9, 2e9) + 0.5)); }
-
-// The largest size of a ratio within a picture.
-Size SizeOfRatio(double across, double down, Size picture) {
-  const double width = picture.width, height = picture.height;
-  const bool fullWidth = width * down <= height * across;
-  const double w = fullWidth ? width : height * across / down, h = fullWidth ? width * down / across : height;
-  return {std::clamp(Whole(w), 1, picture.width), std::clamp(Whole(h), 1, picture.height)};
+Status Crop(PictureRecord& picture, const Arguments& arguments, const OperationContext&) {
+  const Size whole{picture.image.Width(), picture.image.Height()};
+  return CutPicture(picture, AreaOf(arguments.Of("area"), whole, picture.metadata, arguments.Choice<Gravity>("gravity")));
 }
 
-Status Crop(PictureRecord& picture, const Arguments& arguments, const OperationContext&) {
-  const Value& area = arguments.Of("area");
-  const Size whole{picture.image.Width(), picture.image.Height()};
-  const PictureMetadata& metadata = picture.metadata;
-  const auto gravity = arguments.Choice<Gravity>("gravity");
-  if (area.ratio) {
-    return CutPicture(picture, PlaceWithin(whole, SizeOfRatio(area.width.number, area.height.number, whole), gravity));
-  }
-  const Size size{std::max(Whole(area.width.Pixels(whole.width, metadata.dpiX)), 1),
-                  std::max(Whole(area.height.Pixels(whole.height, metadata.dpiY)), 1)};
-  if (area.hasPlace) {
-    return CutPicture(picture, {Whole(area.x.Pixels(whole.width, metadata.dpiX)), Whole(area.y.Pixels(whole.height, metadata.dpiY)),
-                                size.width, size.height});
-  }
-  return CutPicture(picture, PlaceWithin(whole, {std::min(size.width, whole.width), std::min(size.height, whole.height)}, gravity));
+constexpr Parameter kTrim[] = {
+    {.name = "fuzz", .kind = kInteger, .unit = "levels", .preset = "0", .least = 0, .most = 255, .label = "Fuzz",
+     .help = "How far a pixel may be from the top left pixel and still be cut off."},
+    {.name = "margin", .kind = kInteger, .unit = "px", .preset = "0", .least = 0, .most = 100000, .label = "Margin",
+     .help = "How much of the border stays."},
+};
+
+Status Trim(PictureRecord& picture, const Arguments& arguments, const OperationContext&) {
+  Rectangle content;
+  RETURN_IF_BAD(FindContent(picture, arguments.Integer("fuzz"), content));
+  const int32_t margin = arguments.Integer("margin");
+  return CutPicture(picture, {content.x - margin, content.y - margin, content.width + 2 * margin, content.height + 2 * margin});
+}
+
+constexpr Parameter kCanvas[] = {
+    {.name = "size", .kind = kSize, .unit = "px", .least = 0.0001, .most = 1e9, .label = "Size",
+     .help = "WxH, Wx or xH; or one value for both edges. What does not fit is cut off."},
+    {.name = "gravity", .kind = kChoice, .preset = "center", .choices = kGravities, .label = "Place",
+     .help = "Where the picture is on the canvas."},
+    {.name = "background", .kind = kColor, .preset = "#ffffff", .label = "Background", .help = "The color of the rest.",
+     .key = "AlphaBackground"},
+};
+
+int32_t Whole(double pixels) { return static_cast<int32_t>(std::floor(std::clamp(pixels, 1.0, 1e9) + 0.5)); }
+
+Status Canvas(PictureRecord& picture, const Arguments& arguments, const OperationContext&) {
+  const Value& wanted = arguments.Of("size");
+  const Size own{picture.image.Width(), picture.image.Height()};
+  const Length& height = wanted.longestEdge ? wanted.width : wanted.height;
+  Size size = own;
+  if (wanted.hasWidth || wanted.longestEdge) size.width = Whole(wanted.width.Pixels(own.width, picture.metadata.dpiX));
+  if (wanted.hasHeight || wanted.longestEdge) size.height = Whole(height.Pixels(own.height, picture.metadata.dpiY));
+  const Rectangle place = PlaceWithin(size, own, arguments.Choice<Gravity>("gravity"));
+  return PlaceOnCanvas(picture, size, place.x, place.y, BackdropOf(arguments.Color("background")));
 }
 
 constexpr Operation kOperations[] = {
     {.name = "crop", .family = Family::Crop, .label = "Crop", .help = "Keeps a part of the picture and cuts off the rest.",
      .example = "crop 3:2 gravity=top", .parameters = kCrop, .works = Works::Geometry, .apply = Crop},
+    {.name = "trim", .family = Family::Crop, .label = "Trim", .help = "Cuts off a border of one color.", .example = "trim 10 margin=2",
+     .parameters = kTrim, .works = Works::Geometry, .apply = Trim},
+    {.name = "canvas", .family = Family::Crop, .label = "Canvas",
+     .help = "Puts the picture onto a larger or smaller canvas without scaling it.", .example = "canvas 200x200 gravity=top background=gray",
+     .parameters = kCanvas, .works = Works::Geometry, .apply = Canvas},
 };
 
 }  // namespace

@@ -1,7 +1,17 @@
+#include <charconv>
+#include <cmath>
+#include <cstring>
+#include <vector>
+
+#include "operations/area.h"
 #include "operations/operations.h"
 #include "processing/filters/box_blur.h"
+#include "processing/filters/convolve.h"
 #include "processing/filters/gaussian.h"
+#include "processing/filters/mosaic.h"
+#include "processing/filters/motion_blur.h"
 #include "processing/filters/rank.h"
+#include "processing/filters/surface_blur.h"
 
 // Filters: what becomes of a pixel depends on its neighbors.
 namespace fotomill {
@@ -51,6 +61,155 @@ Status ApplyRank(PictureRecord& picture, const Arguments& arguments, const Opera
   return RankPicture(picture, rank, Radius(arguments), context.work);
 }
 
+constexpr Parameter kMotion[] = {
+    {.name = "length", .kind = kNumber, .unit = "px", .preset = "10", .least = 1, .most = 1000, .label = "Length", .help = "How far things move."},
+    {.name = "angle", .kind = kAngle, .unit = "degrees", .preset = "0", .least = -360, .most = 360, .label = "Angle",
+     .help = "The direction; 0 is to the right."},
+};
+
+Status MotionBlur(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+  return MotionBlurPicture(picture, arguments.Number("length"), arguments.Number("angle"), context.work);
+}
+int32_t ReachOfMotion(const Arguments& arguments) { return MotionReach(arguments.Number("length")); }
+
+constexpr Parameter kRadial[] = {
+    {.name = "kind", .kind = kChoice, .preset = "spin", .choices = "spin|zoom", .label = "Kind",
+     .help = "spin blurs around a center, zoom away from it."},
+    {.name = "amount", .kind = kNumber, .preset = "10", .least = 0, .most = 100, .label = "Amount",
+     .help = "Degrees of a spin, percent of a zoom."},
+    {.name = "center", .kind = kPoint, .unit = "px", .preset = "50%,50%", .label = "Center", .help = "What stays sharp."},
+};
+
+Status RadialBlur(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+  const AreaPoint center = PointOf(arguments.Of("center"), {picture.image.Width(), picture.image.Height()}, picture.metadata);
+  return RadialBlurPicture(picture, arguments.Choice<RadialKind>("kind"), arguments.Number("amount"), center.x, center.y, context.work);
+}
+
+constexpr Parameter kDespeckle[] = {
+    {.name = "radius", .kind = kInteger, .unit = "px", .preset = "1", .least = 1, .most = kMostRankRadius, .label = "Radius",
+     .help = "Specks must be smaller than this."},
+    {.name = "threshold", .kind = kInteger, .unit = "levels", .preset = "20", .least = 0, .most = 255, .label = "Threshold",
+     .help = "How much a speck differs from what is around it."},
+};
+
+Status Despeckle(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+  return DespecklePicture(picture, Radius(arguments), arguments.Integer("threshold"), context.work);
+}
+
+constexpr Parameter kSurface[] = {
+    {.name = "radius", .kind = kInteger, .unit = "px", .preset = "3", .least = 1, .most = kMostSurfaceRadius, .label = "Radius",
+     .help = "A square of twice as many pixels and one more on each side counts."},
+    {.name = "threshold", .kind = kInteger, .unit = "levels", .preset = "20", .least = 0, .most = 255, .label = "Threshold",
+     .help = "Pixels that differ more do not count."},
+};
+
+Status SurfaceBlur(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+  return SurfaceBlurPicture(picture, Radius(arguments), arguments.Integer("threshold"), context.work);
+}
+
+constexpr Parameter kOil[] = {
+    {.name = "radius", .kind = kInteger, .unit = "px", .preset = "4", .least = 1, .most = kMostOilRadius, .label = "Radius",
+     .help = "The size of the brush."},
+    {.name = "levels", .kind = kInteger, .preset = "32", .least = 2, .most = kMostOilLevels, .label = "Levels",
+     .help = "How many shades are told apart."},
+};
+
+Status Oil(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+  return OilPicture(picture, Radius(arguments), arguments.Integer("levels"), context.work);
+}
+
+constexpr Parameter kEdges[] = {
+    {.name = "amount", .kind = kNumber, .preset = "1", .least = 0, .most = 100, .label = "Amount", .help = "How bright edges become."},
+};
+
+Status Edges(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+  return FindPictureEdges(picture, arguments.Number("amount"), context.work);
+}
+
+constexpr Parameter kEmboss[] = {
+    {.name = "angle", .kind = kAngle, .unit = "degrees", .preset = "315", .least = -360, .most = 360, .label = "Light",
+     .help = "Where the light comes from; 0 is from the top."},
+    {.name = "depth", .kind = kNumber, .preset = "2", .least = 0, .most = 100, .label = "Depth", .help = "How strong the relief is."},
+};
+
+Status Emboss(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+  return EmbossPicture(picture, arguments.Number("angle"), arguments.Number("depth"), context.work);
+}
+int32_t ReachOfGradient(const Arguments&) { return 1; }
+
+constexpr Parameter kKernel[] = {
+    {.name = "weights", .kind = kText, .most = 4000, .label = "Weights",
+     .help = "9, 25, 49 or 81 numbers with blanks or commas between them, row by row."},
+    {.name = "divisor", .kind = kNumber, .preset = "", .least = -1e6, .most = 1e6, .label = "Divisor",
+     .help = "What the sum is divided by; that of the weights when it is left out, or 1 if that is 0."},
+    {.name = "bias", .kind = kNumber, .unit = "levels", .preset = "0", .least = -255, .most = 255, .label = "Bias",
+     .help = "What is added in the end."},
+};
+
+// Numbers with blanks or commas between them; empty when something else is in the text.
+std::vector<double> NumbersOf(const std::string& text) {
+  std::vector<double> numbers;
+  const char *at = text.data(), *end = at + text.size();
+  while (at < end) {
+    if (std::strchr(" ,\t\n", *at) != nullptr) {
+      ++at;
+      continue;
+    }
+    double number = 0;
+    const auto [behind, error] = std::from_chars(at, end, number);
+    if (error != std::errc() || !(std::abs(number) <= 1e6)) return {};
+    numbers.push_back(number);
+    at = behind;
+  }
+  return numbers;
+}
+
+ArgumentProblem CheckKernel(const Arguments& arguments) {
+  const size_t count = NumbersOf(arguments.Text("weights")).size();
+  if (count != 9 && count != 25 && count != 49 && count != 81) return {"weights", "must be 9, 25, 49 or 81 numbers"};
+  if (arguments.Has("divisor") && arguments.Number("divisor") == 0) return {"divisor", "must not be 0"};
+  return {};
+}
+
+Status Kernel(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+  const std::vector<double> weights = NumbersOf(arguments.Text("weights"));
+  double divisor = 0;
+  for (const double weight : weights) divisor += weight;
+  if (arguments.Has("divisor")) divisor = arguments.Number("divisor");
+  return ConvolvePicture(picture, weights, divisor == 0 ? 1 : divisor, arguments.Number("bias"), context.work);
+}
+int32_t ReachOfKernel(const Arguments& arguments) { return KernelReach(NumbersOf(arguments.Text("weights")).size()); }
+
+// A rectangle of the whole picture, seen from the part that is computed; without one, all of the picture.
+Rectangle AreaOfPart(const PictureRecord& picture, const Value& area, const OperationContext& context) {
+  const Size own{picture.image.Width(), picture.image.Height()}, whole = context.whole.width > 0 ? context.whole : own;
+  Rectangle seen = area.given ? AreaOf(area, whole, picture.metadata) : Rectangle{0, 0, whole.width, whole.height};
+  seen.x -= context.left;
+  seen.y -= context.top;
+  return seen;
+}
+
+constexpr Parameter kMosaic[] = {
+    {.name = "size", .kind = kInteger, .unit = "px", .preset = "10", .least = 1, .most = 10000, .label = "Size", .help = "The edge of a square."},
+    {.name = "area", .kind = kRectangle, .unit = "px", .preset = "", .label = "Area", .help = "WxH+X+Y; the whole picture when it is left out."},
+};
+
+Status Mosaic(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+  return MosaicPicture(picture, AreaOfPart(picture, arguments.Of("area"), context), arguments.Integer("size"), context.work);
+}
+int32_t ReachOfMosaic(const Arguments& arguments) { return arguments.Integer("size"); }
+
+constexpr Parameter kRedEye[] = {
+    {.name = "area", .kind = kRectangle, .unit = "px", .label = "Area", .help = "WxH+X+Y around the eyes."},
+    {.name = "sensitivity", .kind = kPercent, .unit = "%", .preset = "50", .least = 0, .most = 100, .label = "Sensitivity",
+     .help = "How little red is enough."},
+};
+
+Status RedEye(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+  return RemoveRedEye(picture, AreaOfPart(picture, arguments.Of("area"), context), 2.6 - arguments.Number("sensitivity") / 50);
+}
+int32_t NoReach(const Arguments&) { return 0; }
+
 constexpr Operation kOperations[] = {
     {.name = "blur", .family = Family::Filter, .label = "Gaussian blur", .help = "Blurs a picture evenly.", .example = "blur 2",
      .parameters = kBlur, .works = Works::Neighborhood, .apply = Blur, .reach = Reach},
@@ -71,6 +230,27 @@ constexpr Operation kOperations[] = {
     {.name = "maximum", .family = Family::Filter, .label = "Maximum",
      .help = "Replaces each pixel by the brightest level of a square around it: bright parts grow.", .example = "maximum 2",
      .parameters = kWindow, .works = Works::Neighborhood, .apply = ApplyRank<Rank::Maximum>, .reach = Radius},
+    {.name = "motion-blur", .family = Family::Filter, .label = "Motion blur", .help = "Blurs along a line.",
+     .example = "motion-blur 12 30", .parameters = kMotion, .works = Works::Neighborhood, .apply = MotionBlur, .reach = ReachOfMotion},
+    {.name = "radial-blur", .family = Family::Filter, .label = "Radial blur", .help = "Blurs around a center or away from it.",
+     .example = "radial-blur zoom 20", .parameters = kRadial, .works = Works::WholePicture, .apply = RadialBlur},
+    {.name = "despeckle", .family = Family::Filter, .label = "Despeckle", .help = "Removes specks and leaves the rest alone.",
+     .example = "despeckle threshold=30", .parameters = kDespeckle, .works = Works::Neighborhood, .apply = Despeckle, .reach = Radius},
+    {.name = "surface-blur", .family = Family::Filter, .label = "Surface blur", .help = "Blurs surfaces and keeps edges.",
+     .example = "surface-blur 4 25", .parameters = kSurface, .works = Works::Neighborhood, .apply = SurfaceBlur, .reach = Radius},
+    {.name = "edges", .family = Family::Filter, .label = "Edges", .help = "Shows edges bright on black.", .example = "edges",
+     .parameters = kEdges, .works = Works::Neighborhood, .apply = Edges, .reach = ReachOfGradient},
+    {.name = "emboss", .family = Family::Filter, .label = "Emboss", .help = "Makes a gray relief of the picture.",
+     .example = "emboss 315 3", .parameters = kEmboss, .works = Works::Neighborhood, .apply = Emboss, .reach = ReachOfGradient},
+    {.name = "oil", .family = Family::Filter, .label = "Oil painting", .help = "Makes strokes of one color.", .example = "oil 3",
+     .parameters = kOil, .works = Works::Neighborhood, .apply = Oil, .reach = Radius},
+    {.name = "mosaic", .family = Family::Filter, .label = "Mosaic", .help = "Makes squares of one color, to hide a face or a number.",
+     .example = "mosaic 8 50%x50%+10+10", .parameters = kMosaic, .works = Works::Neighborhood, .apply = Mosaic, .reach = ReachOfMosaic},
+    {.name = "kernel", .family = Family::Filter, .label = "Own filter", .help = "Weighs the pixels around each pixel.",
+     .example = "kernel \"0 -1 0 -1 5 -1 0 -1 0\"", .parameters = kKernel, .works = Works::Neighborhood, .apply = Kernel,
+     .reach = ReachOfKernel, .check = CheckKernel},
+    {.name = "red-eye", .family = Family::Filter, .label = "Red eyes", .help = "Takes the red of a flash out of eyes.",
+     .example = "red-eye 50%x50%+10%+10%", .parameters = kRedEye, .works = Works::Neighborhood, .apply = RedEye, .reach = NoReach},
 };
 
 }  // namespace

@@ -1,14 +1,17 @@
 #include <algorithm>
 #include <cmath>
-#include <cstring>
 
 #include "metadata/exif/picture_exif.h"
+#include "operations/area.h"
+#include "operations/backdrop.h"
 #include "operations/gravity.h"
 #include "operations/operations.h"
+#include "processing/geometry/canvas.h"
 #include "processing/geometry/cut.h"
 #include "processing/geometry/orient.h"
+#include "processing/geometry/rotate.h"
 #include "processing/geometry/scale.h"
-#include "processing/promote.h"
+#include "processing/geometry/skew.h"
 
 // Transform: size and position of whole pictures.
 namespace fotomill {
@@ -83,34 +86,6 @@ bool IsKept(const Arguments& arguments, Size picture, Size scaled) {
   return arguments.Choice<Only>("only") == Only::Shrink ? grows : shrinks;
 }
 
-// Puts the picture into the middle of a larger one of 24 bits; one that is transparent there gets an alpha plane.
-Status PadPicture(PictureRecord& picture, Size size, const AlphaColor& color) {
-  const Rectangle place = PlaceWithin(size, {picture.image.Width(), picture.image.Height()}, Gravity::Center);
-  PackedImage image, alpha;
-  RETURN_IF_BAD(NewPackedImage(size.width, size.height, nullptr, 24, image, platform::Fill::Zero));
-  RETURN_IF_BAD(color.alpha < 255 ? PromoteToAlpha(picture) : PromotePicture(picture));
-  const bool hasAlpha = !picture.alpha.Empty();
-  if (hasAlpha) RETURN_IF_BAD(NewAlphaPlane(size.width, size.height, alpha));
-  for (int32_t y = 0; y < size.height; ++y) {
-    uint8_t* bgr = image.Row(y).data();
-    for (int32_t x = 0; x < size.width; ++x) {
-      bgr[3 * x] = color.blue;
-      bgr[3 * x + 1] = color.green;
-      bgr[3 * x + 2] = color.red;
-    }
-    if (hasAlpha) std::memset(alpha.Row(y).data(), color.alpha, static_cast<size_t>(size.width));
-    const int32_t source = y - place.y;
-    if (source < 0 || source >= place.height) continue;
-    std::memcpy(bgr + 3 * static_cast<size_t>(place.x), picture.image.Row(source).data(), 3 * static_cast<size_t>(place.width));
-    if (hasAlpha) std::memcpy(alpha.Row(y).data() + place.x, picture.alpha.Row(source).data(), static_cast<size_t>(place.width));
-  }
-  picture.image = std::move(image);
-  picture.alpha = std::move(alpha);
-  picture.width = size.width;
-  picture.height = size.height;
-  return Status::Ok;
-}
-
 Status Resize(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
   const Size whole{picture.image.Width(), picture.image.Height()};
   const auto mode = arguments.Choice<Mode>("mode");
@@ -132,27 +107,108 @@ Status Resize(PictureRecord& picture, const Arguments& arguments, const Operatio
   const Size result{mode == Mode::Fill ? std::min(target.result.width, target.scaled.width) : target.result.width,
                     mode == Mode::Fill ? std::min(target.result.height, target.scaled.height) : target.result.height};
   if (mode == Mode::Fill) return CutPicture(picture, PlaceWithin(target.scaled, result, Gravity::Center));
-  const bool pads = mode == Mode::Pad && (result.width > target.scaled.width || result.height > target.scaled.height);
-  return pads ? PadPicture(picture, {std::max(result.width, target.scaled.width), std::max(result.height, target.scaled.height)},
-                           arguments.Color("background"))
-              : Status::Ok;
+  if (mode != Mode::Pad) return Status::Ok;
+  const Size padded{std::max(result.width, target.scaled.width), std::max(result.height, target.scaled.height)};
+  const Rectangle place = PlaceWithin(padded, target.scaled, Gravity::Center);
+  return PlaceOnCanvas(picture, padded, place.x, place.y, BackdropOf(arguments.Color("background")));
 }
 
+constexpr Parameter kBackground = {.name = "background", .kind = kColor, .preset = "#ffffff", .label = "Background",
+                                   .help = "What is seen where the picture does not reach.", .key = "AlphaBackground"};
+constexpr Parameter kGrow = {.name = "mode", .kind = kChoice, .preset = "grow", .choices = "grow|keep", .label = "Mode",
+                             .help = "grow makes room for the whole picture, keep leaves its size."};
+constexpr Parameter kSampling = {.name = "filter", .kind = kChoice, .preset = "bicubic", .choices = "bicubic|bilinear|nearest",
+                                 .label = "Filter", .help = "How pixels are computed from those around them."};
 constexpr Parameter kRotate[] = {
     {.name = "angle", .kind = kAngle, .unit = "degrees", .least = -360, .most = 360, .label = "Angle",
-     .help = "Clockwise."},
+     .help = "Clockwise. Multiples of 90 change no pixel."},
+    kBackground, kGrow, kSampling,
 };
 
-Status Rotate(PictureRecord& picture, const Arguments& arguments, const OperationContext&) {
-  constexpr Orientation kQuarters[] = {Orientation::Upright, Orientation::QuarterRight, Orientation::HalfTurn,
-                                       Orientation::QuarterLeft};
-  const auto quarters = static_cast<int32_t>(arguments.Number("angle") / 90);
-  return OrientPicture(picture, kQuarters[(quarters % 4 + 4) % 4]);
+WarpOptions SamplingOf(const Arguments& arguments) {
+  return {.filter = arguments.Choice<WarpFilter>("filter"), .edgesRepeat = false, .backdrop = BackdropOf(arguments.Color("background"))};
 }
 
-ArgumentProblem CheckRotate(const Arguments& arguments) {
-  if (std::fmod(arguments.Number("angle"), 90) == 0) return {};
-  return {"angle", "must be a multiple of 90"};
+Status Rotate(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+  return RotatePicture(picture, arguments.Number("angle"), arguments.Choice("mode") == 0, SamplingOf(arguments), context.work);
+}
+
+constexpr Parameter kStraighten[] = {
+    {.name = "angle", .kind = kAngle, .unit = "degrees", .least = -45, .most = 45, .label = "Angle", .help = "Clockwise."},
+    kSampling,
+};
+
+Status Straighten(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+  return StraightenPicture(picture, arguments.Number("angle"), arguments.Choice<WarpFilter>("filter"), context.work);
+}
+
+constexpr Parameter kDeskew[] = {
+    {.name = "most", .kind = kAngle, .unit = "degrees", .preset = "15", .least = 0.1, .most = 45, .label = "At most",
+     .help = "The largest angle to look for."},
+    kBackground,
+    {.name = "mode", .kind = kChoice, .preset = "keep", .choices = "grow|keep", .label = "Mode",
+     .help = "grow makes room for the whole picture, keep leaves its size."},
+    kSampling,
+};
+
+Status Deskew(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+  double angle = 0;
+  RETURN_IF_BAD(FindSkew(picture, arguments.Number("most"), context.work, angle));
+  if (angle == 0) return Status::Ok;
+  return RotatePicture(picture, -angle, arguments.Choice("mode") == 0, SamplingOf(arguments), context.work);
+}
+
+constexpr Parameter kShear[] = {
+    {.name = "across", .kind = kAngle, .unit = "degrees", .preset = "0", .least = -80, .most = 80, .label = "Across",
+     .help = "By how much columns lean: the bottom goes to the right."},
+    {.name = "down", .kind = kAngle, .unit = "degrees", .preset = "0", .least = -80, .most = 80, .label = "Down",
+     .help = "By how much rows lean after that: the right side goes down."},
+    kBackground, kSampling,
+};
+
+Status Shear(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+  return ShearPicture(picture, arguments.Number("across"), arguments.Number("down"), SamplingOf(arguments), context.work);
+}
+
+constexpr Parameter CornerRow(const char* name, const char* preset, const char* label) {
+  return {.name = name, .kind = kPoint, .unit = "px", .preset = preset, .label = label,
+          .help = "The point of the picture that becomes this corner."};
+}
+constexpr Parameter kPerspective[] = {
+    CornerRow("top-left", "0,0", "Top left"), CornerRow("top-right", "100%,0", "Top right"),
+    CornerRow("bottom-right", "100%,100%", "Bottom right"), CornerRow("bottom-left", "0,100%", "Bottom left"),
+    {.name = "size", .kind = kSize, .unit = "px", .preset = "", .least = 0.0001, .most = 1e9, .label = "Size",
+     .help = "WxH, Wx or xH of the result, or one value for both edges. As long as the longer edge between the points when it is left out."},
+    kBackground, kSampling,
+};
+
+Status Perspective(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+  constexpr const char* kNames[] = {"top-left", "top-right", "bottom-right", "bottom-left"};
+  const PictureMetadata& metadata = picture.metadata;
+  const Size whole{picture.image.Width(), picture.image.Height()};
+  Corner corners[4];
+  for (size_t i = 0; i < 4; ++i) {
+    const AreaPoint point = PointOf(arguments.Of(kNames[i]), whole, metadata);
+    corners[i] = {point.x, point.y};
+  }
+  Size size{0, 0};
+  if (arguments.Has("size")) {
+    const Value& wanted = arguments.Of("size");
+    const Length& down = wanted.longestEdge ? wanted.width : wanted.height;
+    if (wanted.hasWidth || wanted.longestEdge) size.width = Whole(wanted.width.Pixels(whole.width, metadata.dpiX));
+    if (wanted.hasHeight || wanted.longestEdge) size.height = Whole(down.Pixels(whole.height, metadata.dpiY));
+  }
+  return UnwarpPicture(picture, corners, size, SamplingOf(arguments), context.work);
+}
+
+constexpr Parameter kOffset[] = {
+    {.name = "x", .kind = kLength, .unit = "px", .preset = "50%", .label = "Right", .help = "How far to the right."},
+    {.name = "y", .kind = kLength, .unit = "px", .preset = "50%", .label = "Down", .help = "How far down."},
+};
+
+Status Offset(PictureRecord& picture, const Arguments& arguments, const OperationContext&) {
+  return WrapPicture(picture, arguments.Pixels("x", picture.image.Width(), picture.metadata.dpiX),
+                     arguments.Pixels("y", picture.image.Height(), picture.metadata.dpiY));
 }
 
 constexpr Parameter kFlip[] = {
@@ -171,12 +227,25 @@ constexpr Operation kOperations[] = {
     {.name = "resize", .family = Family::Transform, .label = "Resize", .help = "Scales a picture to another size.",
      .example = "resize 800x600 filter=lanczos3", .parameters = kResize, .works = Works::Geometry, .apply = Resize},
     {.name = "rotate", .family = Family::Transform, .label = "Rotate", .help = "Rotates a picture clockwise.",
-     .example = "rotate 90", .parameters = kRotate, .works = Works::Geometry, .apply = Rotate, .check = CheckRotate},
+     .example = "rotate 7 background=black", .parameters = kRotate, .works = Works::Geometry, .apply = Rotate},
     {.name = "flip", .family = Family::Transform, .label = "Flip", .help = "Mirrors a picture.", .example = "flip vertical",
      .parameters = kFlip, .works = Works::Geometry, .apply = Flip},
     {.name = "upright", .family = Family::Transform, .label = "Upright",
      .help = "Rotates a picture as its EXIF orientation says.", .example = "upright", .parameters = {},
      .works = Works::Geometry, .apply = Upright},
+    {.name = "straighten", .family = Family::Transform, .label = "Straighten",
+     .help = "Rotates a picture a little and crops it to the largest upright rectangle.", .example = "straighten 2.5",
+     .parameters = kStraighten, .works = Works::Geometry, .apply = Straighten},
+    {.name = "deskew", .family = Family::Transform, .label = "Deskew", .help = "Finds the angle of a scanned page and sets it straight.",
+     .example = "deskew 10", .parameters = kDeskew, .works = Works::Geometry, .apply = Deskew},
+    {.name = "shear", .family = Family::Transform, .label = "Shear", .help = "Slants a picture.", .example = "shear 10",
+     .parameters = kShear, .works = Works::Geometry, .apply = Shear},
+    {.name = "perspective", .family = Family::Transform, .label = "Perspective",
+     .help = "Makes a rectangle of the shape between four points, such as a sheet of paper in a photo.",
+     .example = "perspective 10%,5% 90%,0 100%,100% 0,95%", .parameters = kPerspective, .works = Works::Geometry, .apply = Perspective},
+    {.name = "offset", .family = Family::Transform, .label = "Offset",
+     .help = "Moves a picture; what leaves on one side comes in on the other.", .example = "offset 50% 0", .parameters = kOffset,
+     .works = Works::Geometry, .apply = Offset},
 };
 
 }  // namespace
