@@ -1,4 +1,4 @@
-#!/usr/bin/env python3
+#!/usr/bin/python3
 """Operations give what Pillow gives, where Pillow computes the same."""
 import os
 import subprocess

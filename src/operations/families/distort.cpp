@@ -106,7 +106,7 @@ Status Bulge(PictureRecord& picture, const Arguments& arguments, const Operation
 constexpr Operation kOperations[] = {
     {.name = "noise", .family = Family::Filter, .label = "Noise", .help = "Adds noise.", .example = "noise gaussian 5%",
      .parameters = kNoise, .works = Works::Neighborhood, .apply = Noise, .reach = NoReach},
-    {.name = "spread", .family = Family::Filter, .label = "Spread", .help = "Lets pixels change places with near ones, as frosted glass does.",
+    {.name = "spread", .family = Family::Filter, .label = "Spread", .help = "Takes pixels from near places at random, as frosted glass does.",
      .example = "spread 4", .parameters = kSpread, .works = Works::Neighborhood, .apply = Spread, .reach = ReachOfSpread},
     {.name = "ripple", .family = Family::Filter, .label = "Ripple", .help = "Rings on water.", .example = "ripple 3 20",
      .parameters = kRipple, .works = Works::Neighborhood, .apply = Ripple, .reach = ReachOfWave},

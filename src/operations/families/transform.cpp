@@ -170,13 +170,15 @@ Status Shear(PictureRecord& picture, const Arguments& arguments, const Operation
   return ShearPicture(picture, arguments.Number("across"), arguments.Number("down"), SamplingOf(arguments), context.work);
 }
 
-constexpr Parameter CornerRow(const char* name, const char* preset, const char* label) {
-  return {.name = name, .kind = kPoint, .unit = "px", .preset = preset, .label = label,
-          .help = "The point of the picture that becomes this corner."};
-}
 constexpr Parameter kPerspective[] = {
-    CornerRow("top-left", "0,0", "Top left"), CornerRow("top-right", "100%,0", "Top right"),
-    CornerRow("bottom-right", "100%,100%", "Bottom right"), CornerRow("bottom-left", "0,100%", "Bottom left"),
+    {.name = "top-left", .kind = kPoint, .unit = "px", .preset = "0,0", .label = "Top left",
+     .help = "The point of the picture that becomes this corner."},
+    {.name = "top-right", .kind = kPoint, .unit = "px", .preset = "100%,0", .label = "Top right",
+     .help = "The point of the picture that becomes this corner."},
+    {.name = "bottom-right", .kind = kPoint, .unit = "px", .preset = "100%,100%", .label = "Bottom right",
+     .help = "The point of the picture that becomes this corner."},
+    {.name = "bottom-left", .kind = kPoint, .unit = "px", .preset = "0,100%", .label = "Bottom left",
+     .help = "The point of the picture that becomes this corner."},
     {.name = "size", .kind = kSize, .unit = "px", .preset = "", .least = 0.0001, .most = 1e9, .label = "Size",
      .help = "WxH, Wx or xH of the result, or one value for both edges. As long as the longer edge between the points when it is left out."},
     kBackground, kSampling,

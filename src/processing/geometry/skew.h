@@ -6,7 +6,7 @@
 
 namespace fotomill {
 
-// By how many degrees, clockwise, the lines of a scanned page are turned; at most `most` either way, exact to about 0.02. 0 for
+// By how many degrees, clockwise, the lines of a scanned page are turned; at most `most` either way, exact to about 0.1. 0 for
 // pictures without lines. A rotation by the negative angle sets it straight. MemoryAllocationError, FunctionCancelled.
 //
 // Edges between dark and light are counted along slanted lines. The angle at which the sum of the squares of the counts is
