@@ -33,7 +33,7 @@ def perspective(picture):
 # line of a recipe, what Pillow makes of the picture, most levels apart, pixels of the border that are left out
 ROWS = [
     ("rotate 7 filter=bilinear mode=keep", lambda p: p.rotate(-7, Image.Resampling.BILINEAR), 2, None),
-    ("rotate -24.5 filter=bicubic mode=keep", lambda p: p.rotate(24.5, Image.Resampling.BICUBIC), 2, None),
+    ("rotate -24.5 filter=bilinear mode=keep", lambda p: p.rotate(24.5, Image.Resampling.BILINEAR), 2, None),
     ("rotate 90", lambda p: p.transpose(Image.Transpose.ROTATE_270), 0, 0),
     ("rotate 180", lambda p: p.transpose(Image.Transpose.ROTATE_180), 0, 0),
     ("offset 30 -11", lambda p: ImageChops.offset(p, 30, -11), 0, 0),

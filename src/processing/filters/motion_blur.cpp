@@ -83,6 +83,7 @@ struct Turned {
   double c, s;
 };
 constexpr int32_t kMostPoints = 64;
+constexpr size_t kFewPoints = 8;  // of so many, each shows, and is interpolated
 using Points = std::vector<std::vector<Turned>>;  // by how many there are
 
 Points PointsOf(RadialKind kind, double amount) {
@@ -126,6 +127,17 @@ struct Radial {
     pixel(column + 1, row + 1, partX * partY);
   }
 
+  // Adds the pixel that a place is nearest to.
+  void AddNearest(double x, double y, uint64_t (&sums)[4]) const {
+    const int32_t right = image.Width() - 1, bottom = image.Height() - 1;
+    const auto column = static_cast<size_t>(std::clamp(x, 0.0, static_cast<double>(right)) + 0.5);
+    const auto row = static_cast<int32_t>(std::clamp(y, 0.0, static_cast<double>(bottom)) + 0.5);
+    const uint8_t* bgr = image.Row(row).data() + 3 * column;
+    const uint64_t weight = alpha == nullptr ? 65536 : uint64_t{65536} * alpha->Row(row)[column];
+    for (int c = 0; c < 3; ++c) sums[c] += weight * bgr[c];
+    sums[3] += weight;
+  }
+
   void Row(int32_t y, uint8_t* bgr, uint8_t* opacity) const {
     const double dy = y - centerY;
     for (int32_t x = 0; x < image.Width(); ++x, bgr += 3) {
@@ -133,7 +145,12 @@ struct Radial {
       const auto count = static_cast<size_t>(std::clamp(std::ceil(distance * perPixel), 1.0, static_cast<double>(kMostPoints)));
       uint64_t sums[4] = {};
       for (const Turned& point : points[count]) {
-        Add(centerX + point.c * dx - point.s * dy, centerY + point.s * dx + point.c * dy, sums);
+        const double fromX = centerX + point.c * dx - point.s * dy, fromY = centerY + point.s * dx + point.c * dy;
+        if (count <= kFewPoints) {
+          Add(fromX, fromY, sums);
+        } else {
+          AddNearest(fromX, fromY, sums);
+        }
       }
       uint8_t seen = 255;
       PutAlphaPixel(sums, 65536 * uint64_t{count}, bgr, opacity != nullptr ? opacity[x] : seen);

@@ -17,7 +17,8 @@ Status MotionBlurPicture(PictureRecord& picture, double length, double angle, co
 int32_t MotionReach(double length);
 
 // The mean of points along an arc around a center, `amount` degrees long, or along a line from it, `amount` per cent of the
-// distance long; half of it to either side. As many points as the way has pixels, at most 64.
+// distance long; half of it to either side. As many points as the way has pixels, at most 64;
+// up to 8 are interpolated between pixels.
 enum class RadialKind : int32_t { Spin, Zoom };
 Status RadialBlurPicture(PictureRecord& picture, RadialKind kind, double amount, double centerX, double centerY, const Work& work);
 
