@@ -3,6 +3,8 @@
 #include <algorithm>
 #include <vector>
 
+#include "processing/color/table_row.h"
+
 namespace fotomill {
 
 namespace {
@@ -10,6 +12,10 @@ namespace {
 constexpr int32_t kLeastRows = 16;  // of a band
 
 void ApplyTables(const std::array<ChannelTable, 3>& tables, uint8_t* bgr, size_t pixels) {
+  if (tables[0] == tables[1] && tables[1] == tables[2]) {
+    TableRowHere()(tables[0].data(), bgr, 3 * pixels);
+    return;
+  }
   const uint8_t *blue = tables[0].data(), *green = tables[1].data(), *red = tables[2].data();
   for (size_t i = 0; i < pixels; ++i, bgr += 3) {
     bgr[0] = blue[bgr[0]];

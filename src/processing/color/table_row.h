@@ -1,0 +1,15 @@
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+
+namespace fotomill {
+
+// Replaces each of `count` values by the entry that it selects in a table of 256 bytes.
+using TableRow = void (*)(const uint8_t* table, uint8_t* values, size_t count);
+
+// For this processor, and for any. Both give the same.
+TableRow TableRowHere();
+TableRow BaselineTableRow();
+
+}  // namespace fotomill
