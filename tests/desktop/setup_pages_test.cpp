@@ -24,7 +24,7 @@ std::set<std::string> UsedKeys() {
     if (!entry.is_regular_file() || name == "setup_pages.cpp" || name == "override_options.cpp" || name == "spin_range.cpp")
       continue;
     const std::string text = test::ReadText(entry.path().string());
-    for (const std::string_view lead : {"settings.", "KeyNumber::", "&Settings::"}) {
+    for (const std::string_view lead : {"settings.", "KeyNumber::", "&Settings::", ".key = \""}) {
       for (size_t at = text.find(lead); at != std::string::npos; at = text.find(lead, at + 1)) {
         const size_t start = at + lead.size();
         size_t end = start;
