@@ -150,8 +150,8 @@ PointEffect KeepEffect(KeptChannel channel) {
 
 PointEffect SwapEffect(SwappedChannels channels) {
   constexpr std::pair<uint8_t, uint8_t> kPlaces[] = {{2, 1}, {2, 0}, {1, 0}};
-  const auto [one, other] = kPlaces[static_cast<size_t>(channels)];
-  return EachColor([=](uint8_t* bgr) { std::swap(bgr[one], bgr[other]); });
+  const std::pair<uint8_t, uint8_t> places = kPlaces[static_cast<size_t>(channels)];
+  return EachColor([=](uint8_t* bgr) { std::swap(bgr[places.first], bgr[places.second]); });
 }
 
 PointEffect ThresholdEffect(int32_t t) {
