@@ -99,7 +99,7 @@ constexpr Place kPlaces[] = {
     {"KDC", "(KDC) Kodak Digital Camera", 1, 24, FMT_BITMAP | FMT_SECONDARY},
     {"PCT"},
     {"KQP", "(KQP) Konica Quality Photos", 1, 24, FMT_BITMAP | FMT_SECONDARY},
-    {"PSP", "(PSP) PSP", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_SECONDARY},
+    {"PSP"},
     {"MID", "(MID) MIDI music", 1, 24, FMT_BITMAP | FMT_SECONDARY | FMT_MEDIA | FMT_MIDI},
     {"MP3", "(MP3) MP3 compressed music", 1, 24, FMT_BITMAP | FMT_TIMED | FMT_SECONDARY | FMT_MEDIA},
     {"MP4", "(MP4) MPEG-4 video", 1, 24, FMT_BITMAP | FMT_ANIMATED | FMT_TIMED | FMT_SECONDARY | FMT_MEDIA},

@@ -50,7 +50,6 @@ constexpr SignatureOfRow kWithoutCodec[] = {
     {"KDC",  {0, "II\x2a\0"sv}},
     {"KDC",  {0, "MM\0\x2a"sv}},
     {"",     {0, "8BPS\0\2"sv, "Photoshop PSB"}},
-    {"PSP",  {0, "Paint Shop Pro Image File"sv, "Paint Shop Pro"}},
     {"",     {0, "gimp xcf"sv, "GIMP XCF"}},
     {"",     {0, "FORM"sv, TrLater("IFF animation"), 8, "ANIM"sv}},
     {"",     {0, "qoif"sv, "QOI"}},

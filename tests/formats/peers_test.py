@@ -20,6 +20,10 @@ ROWS = [
     ("ras", "bmp-256-colors.bmp", "rasttopnm"),
     ("ras", "bmp-16-colors.bmp", "rasttopnm"),
     ("ras", "bmp-mono.bmp", "rasttopnm"),
+    ("iff", "bmp-true-color.bmp", "ilbmtoppm"),
+    ("iff", "bmp-256-colors.bmp", "ilbmtoppm"),
+    ("iff", "bmp-16-colors.bmp", "ilbmtoppm"),
+    ("lbm", "bmp-mono.bmp", "ilbmtoppm"),
     ("wbmp", "bmp-mono.bmp", "wbmptopbm"),
 ]
 
