@@ -58,8 +58,8 @@ struct SequentialRenameState {
 // The state of a running function: its request and its results. NewBatchJob creates jobs with the user's settings; a plain job
 // has the built-in defaults, adds no prefixes, and stores nothing. Belongs to the thread that runs the batch.
 struct BatchJob {
-  // Abort: set by the button of the job's own progress box, or by its owner. Functions ask its token between files; what is in
-  // work is finished, nothing new is begun. Whoever asks the program to end stops every job.
+  // Abort: set by the button of the job's own progress box, or by its owner. Functions ask its token between files
+  // and codecs between rows; what is in work is given up or finished, nothing new is begun. Whoever asks the program to end stops every job.
   StopSource stop;
   PathText source;                  // the file in work
   int32_t formatIndex = kNoFormat;  // of the outputs

@@ -12,7 +12,9 @@ namespace fotomill {
 std::string_view LooksLike(const std::string& fileName, int32_t formatIndex) {
   const FileKind kind = IdentifyFile(fileName);
   const bool asNamed = formatIndex != kNoFormat && kind.IsOf(FormatRow(formatIndex).extension.view());
-  return asNamed ? std::string_view() : kind.name;
+  // Targa files have no signature, and the first bytes of many are those of an icon or a cursor.
+  const bool chance = formatIndex != kNoFormat && FormatRow(formatIndex).signatures.empty() && (kind.IsOf("CUR") || kind.IsOf("ICO"));
+  return asNamed || chance ? std::string_view() : kind.name;
 }
 
 std::string OpenHint(const std::string& fileName, Status status) {
@@ -28,7 +30,8 @@ std::string OpenHint(const std::string& fileName, Status status) {
     return Tr("It looks like %1.", Tr(name));
   }
   if (index == kNoFormat) return Tr("Unknown file extension.");
-  return CanRead(FormatRow(index)) ? std::string() : Tr(WhyNot(FormatRow(index)));
+  if (!CanRead(FormatRow(index))) return Tr(WhyNot(FormatRow(index)));
+  return status == Status::UnsupportedFormat ? Tr("This variant of the format cannot be read.") : std::string();
 }
 
 }  // namespace fotomill

@@ -212,7 +212,7 @@ class Batch {
   }
 
   Status Load(const std::string& name, PicturePointer& picture) const {
-    ReadRequest request{.fileName = name, .options = job_.read};
+    ReadRequest request{.fileName = name, .stop = job_.stop.Token(), .options = job_.read};
     RETURN_IF_BAD(LoadPictureInfo(request, picture));
     request.page = picture->page = function_.page - 1;
     if (IsOnlyPlanned()) return function_.page > picture->pageCount ? Status::NoImages : Status::Ok;

@@ -107,8 +107,16 @@ class Turning {
     return WriteUnlessThere(turned.way == JpegTurnWay::Nothing ? file.Bytes() : made, turned.way == JpegTurnWay::Nothing);
   }
 
+  // The old and the turned picture are there at a time, as are the turned one and what is read back.
+  static Status CheckMemory(const PictureRecord& picture) {
+    const uint64_t rows = PackedRowBytes(picture.width, picture.height, picture.bitsPerPixel);
+    const bool alpha = (picture.alphaFlags & kHasAlpha) != 0;
+    return CheckFileMemory(2 * (alpha ? rows + rows / 3 : rows));
+  }
+
   Status TurnDecoded(PicturePointer picture) {
     if (std::string obstacle = Obstacle(*picture); !obstacle.empty()) return Fail(Status::UnsuitableImage, std::move(obstacle));
+    RETURN_IF_BAD(CheckMemory(*picture));
     RETURN_IF_BAD(ReadPicture({.fileName = source_, .options = read_}, *picture));
     if (std::string obstacle = Obstacle(*picture); !obstacle.empty()) return Fail(Status::UnsuitableImage, std::move(obstacle));
     const Orientation told = OrientationOf(*picture);

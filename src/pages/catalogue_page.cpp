@@ -97,6 +97,7 @@ class ContactSheet {
   void Draw(FileOutcome& outcome, PackedImage& image) const {
     const ReadRequest request{.fileName = outcome.source,
                               .thumbnailSide = std::max(options_.look.cellWidth, options_.look.cellHeight),
+                              .stop = stop_,
                               .options = job_.read};
     PicturePointer picture;
     outcome.status = LoadPictureInfo(request, picture);

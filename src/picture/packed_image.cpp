@@ -38,6 +38,10 @@ Status CheckPackedSize(int32_t width, int32_t height, int32_t bitsPerPixel) {
   return fits ? Status::Ok : Status::MemoryAllocationError;
 }
 
+Status CheckFileMemory(uint64_t bytes) {
+  return bytes <= limits.fileMemoryBytes ? Status::Ok : Status::MemoryAllocationError;
+}
+
 Status NewPackedImage(int32_t width, int32_t height, const Palette* palette, int32_t bitsPerPixel, PackedImage& image,
                       platform::Fill fill) {
   image.Free();

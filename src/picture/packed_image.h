@@ -81,6 +81,14 @@ class PackedImage {
 // 1, MemoryAllocationError when its block would exceed the limit.
 Status CheckPackedSize(int32_t width, int32_t height, int32_t bitsPerPixel);
 
+// Bytes of the rows of such a picture, without its head.
+constexpr uint64_t PackedRowBytes(int32_t width, int32_t height, int32_t bitsPerPixel) {
+  return RowStride(width, NormalisedDepth(bitsPerPixel)) * static_cast<uint64_t>(height);
+}
+// Whether one file may take so many bytes for all that is held at a time: MemoryAllocationError (6) when not. Codecs ask with
+// what the header promises, their library's memory included, before they take any of it.
+Status CheckFileMemory(uint64_t bytes);
+
 // Makes the packed block of a picture at the normalised depth of `bitsPerPixel`, with its color table taken from
 // `palette` (zero without one) and its rows zero; with Fill::Unset the rows hold anything, for callers that write every
 // byte of them, padding included. DamagedFile when width or height is below 1, MemoryAllocationError when the block would

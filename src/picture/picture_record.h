@@ -9,6 +9,7 @@
 #include "core/fixed_text.h"
 #include "core/progress.h"
 #include "core/status.h"
+#include "core/workers/stop_token.h"
 #include "picture/packed_image.h"
 #include "picture/palette.h"
 #include "platform/memory.h"
@@ -82,6 +83,7 @@ struct PictureRecord {
   uint8_t lostMetadata = 0;            // kLost bits: what the last `write` could not keep
   std::vector<uint8_t> comment;        // the file's comment text, UTF-8
   FixedText<80> warning;               // a fault in the file that the decoder passed over; empty when there was none
+  FixedText<80> note;                  // what the decoder remarks about a file that is whole; empty if nothing
   int32_t pageCount = 1;               // pages or frames in the file
   int32_t page = 0;                    // which of them this is, from 0
   bool simplified = false;             // by `info`: the file holds what a new one would not, deeper samples or further inks
@@ -90,9 +92,13 @@ struct PictureRecord {
                                        // stands for; the last column and row may stand for fewer
   ProgressSink* progress = nullptr;    // of the operation in work; not owned, may be null
 
-  void ReportRow(int32_t done) const { ReportRow(done, height); }
-  void ReportRow(int32_t done, int32_t total) const {
+  StopToken stop;                      // of the operation in work
+
+  // Tells how many rows are done. FunctionCancelled (4) when the operation is to end: codecs return it.
+  Status ReportRow(int32_t done) const { return ReportRow(done, height); }
+  Status ReportRow(int32_t done, int32_t total) const {
     if (progress != nullptr) progress->Step(done, total);
+    return stop.Asked() ? Status::FunctionCancelled : Status::Ok;
   }
 };
 

@@ -4,6 +4,7 @@
 #include <string>
 
 #include "core/progress.h"
+#include "core/workers/stop_token.h"
 
 namespace fotomill {
 
@@ -26,6 +27,7 @@ struct ReadRequest {
   bool signedOnly = false;    // of `info`: a format that knows its files by no signature answers UnsupportedFormat (8)
                               // without opening the file
   ProgressSink* progress = nullptr;  // not owned, may be null
+  StopToken stop = {};               // asked between rows; the status is FunctionCancelled (4) then
   ReadOptions options = {};
 };
 

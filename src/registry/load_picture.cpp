@@ -12,6 +12,7 @@ Status LoadPictureInfo(const ReadRequest& request, PicturePointer& picture) {
   if (!made->fileName.Assign(request.fileName)) return Status::FileOpenError;
   made->formatIndex = index;
   made->progress = request.progress;
+  made->stop = request.stop;
   const FormatEntry& row = FormatRow(index);
   if (row.info != nullptr) RETURN_IF_BAD(row.info(*made, request));
   picture = std::move(made);
@@ -35,6 +36,7 @@ Status ReadPicture(const ReadRequest& request, PictureRecord& picture) {
   if (row.read == nullptr || (row.flags & FMT_RENDERED) != 0) return Status::Ok;
   picture.page = request.page;
   picture.progress = request.progress;
+  picture.stop = request.stop;
   return row.read(picture, request);
 }
 

@@ -51,6 +51,7 @@ TEST(GifRead, Frames) {
       {"a code that cannot be", Gif(screen, place + "00 02 01 3C 00"), Status::DamagedFile, "", ""},
       {"no picture", Gif(screen, ""), Status::NoImages, "", ""},
       {"an empty frame", Gif(screen, "2C 0000 0000 0000 0200 00 02 00"), Status::DamagedFile, "", ""},
+      {"codes wider than the pixels", Gif(screen, place + "00 09 08 00 06 20 C0 00 00 04 08 00"), Status::Ok, "1 2 / 3 0", ""},
       {"pixels of 13 bits", Gif(screen, place + "00 0D 01 00 00"), Status::DamagedFile, "", ""},
       {"not a GIF", Hex("4749463838610200020000"), Status::DamagedFile, "", ""},
   };

@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include "core/choice_lists.h"
+#include "formats/png/png.h"
 #include "settings/settings.h"
 #include "support/codecs.h"
 #include "support/files.h"
@@ -73,6 +74,26 @@ TEST(IcoRead, TheLargestThenDeepestEntryWinsAndPagesSelect) {
     EXPECT_EQ(picture->pageCount, 3);
     EXPECT_EQ(picture->hotSpotY, page == 0 ? 4 : 0);
   }
+}
+
+// PNG entries of one size: the directory tells how deep they are.
+TEST(IcoRead, OfEqualSizesTheDeepestWins) {
+  const auto shallow = Encode(PngWrite, *PatternPicture(20, 20, 4)), deep = Encode(PngWrite, *PatternPicture(20, 20, 24));
+  const auto entry = [](uint8_t bits, size_t size, size_t offset) {
+    std::vector<uint8_t> bytes = {20, 20, 0, 0, 1, 0, bits, 0};
+    for (const size_t value : {size, offset}) {
+      for (int shift = 0; shift < 32; shift += 8) bytes.push_back(static_cast<uint8_t>(value >> shift));
+    }
+    return bytes;
+  };
+  std::vector<uint8_t> file = {0, 0, 1, 0, 2, 0};
+  constexpr size_t kPictures = 6 + 2 * 16;
+  for (const auto& part : {entry(4, shallow.size(), kPictures), entry(32, deep.size(), kPictures + shallow.size()), shallow, deep}) {
+    file.insert(file.end(), part.begin(), part.end());
+  }
+  const Decoded decoded = Decode(IcoRead, file);
+  EXPECT_EQ(decoded.status, Status::Ok);
+  EXPECT_EQ(decoded.picture->image.Bits(), 24);
 }
 
 TEST(IcoWrite, MaskAndPng) {

@@ -57,6 +57,7 @@ TEST(Tiff, SamplesBecomePixels) {
       {"white is zero",            3,  8, 0, 1, kFormat, 1, "00 01 FF",                "0 1 255", ""},
       {"16 bits, rounded",         3, 16, 1, 1, kFormat, 1, "7F 80  80 80  FF FF",     "128 128 255", ""},
       {"16 bits, signed",          3, 16, 1, 1, kFormat, 2, "00 80  00 00  FF 7F",     "0 128 255", ""},
+      {"8 bits, signed, as are",   3,  8, 1, 1, kFormat, 2, "00 80 FF",                "0 128 255", ""},
       {"12 bits",                  2, 12, 1, 1, kFormat, 1, "FF F0 00",                "255 0", ""},
       {"real",                     3, 32, 1, 1, kFormat, 3, "00 00 00 3F  00 00 00 40  00 00 C0 7F", "128 255 0", ""},
       {"half real",                2, 16, 1, 1, kFormat, 3, "00 38  00 BC",            "128 0", ""},

@@ -19,6 +19,7 @@ namespace {
 struct VerifyOptions {
   SelectionOptions selection;
   bool json = false;
+  bool verbose = false;
 };
 
 // Decodes every frame of an animation.
@@ -29,21 +30,22 @@ Status VerifyFrames(const std::string& name) {
   return status == Status::NoImages ? Status::Ok : status;
 }
 
-// Decodes every page of a file.
-Status VerifyFile(const std::string& name, std::string& hint) {
-  int32_t pages = 1;
-  for (int32_t page = 0; page < pages; ++page) {
-    PicturePointer picture;
-    ReadRequest request{.fileName = name, .options = ReadOptionsFromSettings()};
-    RETURN_IF_BAD(LoadPictureInfo(request, picture));
-    request.page = page;
-    pages = picture->pageCount;
+// Decodes every page of a file. What a decoder finds odd in one that is whole becomes the note.
+Status VerifyFile(const std::string& name, std::string& hint, std::string& note) {
+  PicturePointer picture;
+  ReadRequest request{.fileName = name, .options = ReadOptionsFromSettings()};
+  RETURN_IF_BAD(LoadPictureInfo(request, picture));
+  for (; request.page < picture->pageCount; ++request.page) {
     RETURN_IF_BAD(ReadPicture(request, *picture));
     if (!picture->warning.empty()) {  // it can be shown, but data is missing
       hint = Tr(picture->warning.view());
       return Status::DamagedFile;
     }
-    if (pages > 1 && FormatRow(picture->formatIndex).animate != nullptr) return VerifyFrames(name);
+    if (note.empty()) note = picture->note.view();
+    if (picture->pageCount == 1) break;
+    const FormatEntry& row = FormatRow(picture->formatIndex);
+    if (row.animate != nullptr) return VerifyFrames(name);
+    if ((row.flags & FMT_ANIMATED) != 0) break;  // no way to frames: each request gets the same picture
   }
   return Status::Ok;
 }
@@ -56,8 +58,8 @@ int RunVerify(const VerifyOptions& options, const CommandContext& context) {
   UsedFiles used(FileFunction::View);
   for (const SelectedFile& file : *files) {
     if (!output.GoesOn()) break;
-    std::string hint = file.hint;
-    const Status status = file.status == Status::Ok ? VerifyFile(file.name, hint) : file.status;
+    std::string hint = file.hint, note;
+    const Status status = file.status == Status::Ok ? VerifyFile(file.name, hint, note) : file.status;
     if (output.IsJson()) {
       Json element;
       PutName(element, "file", file.name);
@@ -71,6 +73,7 @@ int RunVerify(const VerifyOptions& options, const CommandContext& context) {
     output.CountFile();
     used.Add(file.name);
     if (!output.IsJson()) output.Line(output.Shown(file.name) + ": " + Tr(StatusMessage(status)));
+    if (options.verbose && !note.empty()) output.Note(output.Shown(file.name) + ": " + output.Shown(note));
   }
   return output.Finish();
 }
@@ -81,6 +84,7 @@ void SetUpVerify(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<VerifyOptions>();
   AddSelection(app, options->selection, context);
   AddFlag(app, "--json", options->json, "Print a JSON array of {file, status, message}");
+  AddFlag(app, "-v,--verbose", options->verbose, "Report what is odd in files that are whole");
   SetFooter(app, "Decodes every page of every file; writes nothing.", "fotomill verify -r holiday");
   context.run = [options, &context] { return RunVerify(*options, context); };
 }

@@ -263,7 +263,7 @@ Status ReadRows(const IffFile& file, const PictureRecord& picture, PackedImage& 
     }
     const auto opacity = alpha.Empty() ? std::span<uint8_t>() : alpha.Row(y).first(static_cast<size_t>(file.width));
     maker.Make(row, image.Bits(), image.Row(y), opacity);
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
   }
   return Status::Ok;
 }

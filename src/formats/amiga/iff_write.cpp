@@ -160,7 +160,7 @@ class StoredRows {
   std::vector<uint8_t> pixels_, row_;
 };
 
-void WriteBody(ByteWriter& out, const PictureRecord& picture, const IffLayout& layout, HamEncoder* ham) {
+Status WriteBody(ByteWriter& out, const PictureRecord& picture, const IffLayout& layout, HamEncoder* ham) {
   out.Text("BODY");
   const uint64_t place = out.Position();
   out.Be32(0);
@@ -173,13 +173,14 @@ void WriteBody(ByteWriter& out, const PictureRecord& picture, const IffLayout& l
     for (size_t at = 0; at < row.size() && layout.compressed; at += planeSize) {
       out.Bytes(std::span(code).first(PackBits(row.subspan(at, planeSize), code.data())));
     }
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
   }
-  if (out.Failed()) return;
+  if (out.Failed()) return Status::Ok;  // told by the commit
   const uint64_t size = out.Position() - place - 4;
   out.Zeros(size % 2);
   out.PatchBe32(place, static_cast<uint32_t>(size));
   out.PatchBe32(4, static_cast<uint32_t>(out.Position() - 8));
+  return Status::Ok;
 }
 
 Status Write(PictureRecord& picture, const WriteOptions& options, bool ham) {
@@ -195,7 +196,7 @@ Status Write(PictureRecord& picture, const WriteOptions& options, bool ham) {
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
   WriteHead(out, picture, layout, layout.ham ? encoder.Colors() : picture.palette);
-  WriteBody(out, picture, layout, layout.ham ? &encoder : nullptr);
+  RETURN_IF_BAD(WriteBody(out, picture, layout, layout.ham ? &encoder : nullptr));
   if (out.Position() > UINT32_MAX) return Status::UnsuitableImage;
   return CommitOutput(out, options);
 }

@@ -238,7 +238,7 @@ Status ReadRowsUnchanged(const platform::FileView& file, const BmpHeader& header
     const uint64_t place = static_cast<uint64_t>(header.TopDown() ? height - 1 - r : r) * stride;
     const std::span<uint8_t> rows = image.Rows().subspan(place, static_cast<uint64_t>(count) * stride);
     if (!file.ReadAt(header.PixelOffset() + static_cast<uint64_t>(r) * stride, rows)) return Status::FileReadError;
-    for (int32_t i = 0; i < count; ++i) picture.ReportRow(r + i);
+    for (int32_t i = 0; i < count; ++i) RETURN_IF_BAD(picture.ReportRow(r + i));
   }
   return Status::Ok;
 }
@@ -253,7 +253,7 @@ Status ReadRowsConverted(platform::FileView& file, const BmpHeader& header, cons
     const int32_t stored = header.TopDown() ? height - 1 - r : r;
     readRow(source, header.width, image.StoredRow(stored), alpha.Empty() ? std::span<uint8_t>() : alpha.StoredRow(stored));
     file.DropBefore(offset);
-    picture.ReportRow(r);
+    RETURN_IF_BAD(picture.ReportRow(r));
   }
   return file.Intact() ? Status::Ok : Status::FileReadError;
 }
@@ -306,7 +306,7 @@ Status DecodeRunLength(platform::FileView& file, const BmpHeader& header, const 
       x = 0;
       ++y;
       file.DropBefore(bytes.Position());
-      picture.ReportRow(static_cast<int32_t>(std::min<uint64_t>(y, height)));
+      RETURN_IF_BAD(picture.ReportRow(static_cast<int32_t>(std::min<uint64_t>(y, height))));
     } else if (code == 1) {
       return file.Intact() ? Status::Ok : Status::FileReadError;
     } else if (code == 2) {
@@ -388,21 +388,22 @@ void WritePalette(ByteWriter& out, const BmpLayout& layout, const Palette& palet
   }
 }
 
-void WriteRowsUnchanged(ByteWriter& out, const PictureRecord& picture) {
+Status WriteRowsUnchanged(ByteWriter& out, const PictureRecord& picture) {
   const PackedImage& image = picture.image;
   const int32_t step = RowsPerChunk(image.Stride());
   for (int32_t r = 0; r < image.Height() && !out.Failed(); r += step) {
     const int32_t count = std::min(step, image.Height() - r);
-    for (int32_t i = 0; i < count; ++i) picture.ReportRow(r + i);
+    for (int32_t i = 0; i < count; ++i) RETURN_IF_BAD(picture.ReportRow(r + i));
     out.Bytes(image.Rows().subspan(static_cast<uint64_t>(r) * image.Stride(), static_cast<uint64_t>(count) * image.Stride()));
   }
+  return Status::Ok;
 }
 
-void WriteRowsWithAlpha(ByteWriter& out, const PictureRecord& picture) {
+Status WriteRowsWithAlpha(ByteWriter& out, const PictureRecord& picture) {
   constexpr int32_t kPiece = ByteWriter::kMostReserved / 4;  // pixels
   const int32_t width = picture.image.Width();
   for (int32_t r = 0; r < picture.image.Height() && !out.Failed(); ++r) {
-    picture.ReportRow(r);
+    RETURN_IF_BAD(picture.ReportRow(r));
     const uint8_t* color = picture.image.StoredRow(r).data();
     const uint8_t* alpha = picture.alpha.StoredRow(r).data();
     for (int32_t x = 0; x < width; x += kPiece) {
@@ -412,6 +413,7 @@ void WriteRowsWithAlpha(ByteWriter& out, const PictureRecord& picture) {
       out.Used(4 * count);
     }
   }
+  return Status::Ok;
 }
 
 // A number of a header with a comma between every group of three digits.
@@ -480,11 +482,7 @@ Status BmpWrite(PictureRecord& picture, const WriteOptions& options) {
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
   WriteHeader(out, layout);
   WritePalette(out, layout, picture.palette);
-  if (layout.alpha) {
-    WriteRowsWithAlpha(out, picture);
-  } else {
-    WriteRowsUnchanged(out, picture);
-  }
+  RETURN_IF_BAD(layout.alpha ? WriteRowsWithAlpha(out, picture) : WriteRowsUnchanged(out, picture));
   return CommitOutput(out, options);
 }
 

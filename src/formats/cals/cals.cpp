@@ -152,7 +152,7 @@ Status CalsRead(PictureRecord& picture, const ReadRequest& request) {
   T6Decoder decoder(data, header.width);
   for (int32_t y = 0; y < header.height; ++y) {
     RETURN_IF_BAD(decoder.DecodeRow(image.Row(y).first(header.RowSize())));
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
   }
   if (!file.Intact()) return Status::FileReadError;
   if (header.orientation == Orientation::Upright) {
@@ -176,7 +176,7 @@ Status CalsWrite(PictureRecord& picture, const WriteOptions& options) {
   std::vector<uint8_t> row((static_cast<size_t>(image.Width()) + 7) / 8);
   const uint8_t invert = IsDarkFirst(picture.palette) ? 0xff : 0;
   for (int32_t y = 0; y < image.Height(); ++y) {
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
     for (size_t i = 0; i < row.size(); ++i) row[i] = image.Row(y)[i] ^ invert;
     encoder.EncodeRow(row);
   }

@@ -250,7 +250,7 @@ Status FitsRead(PictureRecord& picture, const ReadRequest& request) {
   for (int32_t y = 0; y < picture.height; ++y) {
     CopyRow(bytes.Take(header.RowBytes()), image.Row(y));
     file.DropBefore(bytes.Position());
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
   }
   if (!file.Intact()) return Status::FileReadError;
   picture.image = std::move(image);
@@ -268,7 +268,7 @@ Status FitsWrite(PictureRecord& picture, const WriteOptions& options) {
   const GrayPixels grayPixels = GrayPixelsFor(image.Bits());
   const auto width = static_cast<size_t>(image.Width()), bits = static_cast<size_t>(image.Bits());
   for (int32_t y = 0; y < image.Height() && !out.Failed(); ++y) {
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
     const uint8_t* row = image.Row(y).data();
     for (size_t x = 0; x < width; x += ByteWriter::kMostReserved) {
       const size_t count = std::min(width - x, ByteWriter::kMostReserved);

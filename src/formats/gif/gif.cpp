@@ -99,7 +99,7 @@ Status ReadIndexed(ByteReader& bytes, const GifFrame& frame, PictureRecord& pict
     } else {
       PackRow(source, picture.width, image.Bits(), image.Row(y).data());
     }
-    picture.ReportRow(r);
+    RETURN_IF_BAD(picture.ReportRow(r));
   }
   return Status::Ok;
 }
@@ -147,7 +147,7 @@ void UnpackRow(std::span<const uint8_t> row, int32_t bits, std::span<uint8_t> in
   }
 }
 
-void WritePixels(ByteWriter& out, const PictureRecord& picture, bool interlaced) {
+Status WritePixels(ByteWriter& out, const PictureRecord& picture, bool interlaced) {
   const PackedImage& image = picture.image;
   out.U8(kPictureBlock);
   out.Zeros(4);
@@ -164,9 +164,10 @@ void WritePixels(ByteWriter& out, const PictureRecord& picture, bool interlaced)
       UnpackRow(row, image.Bits(), indices);
       encoder.Add(indices);
     }
-    picture.ReportRow(r);
+    RETURN_IF_BAD(picture.ReportRow(r));
   }
   encoder.Finish();
+  return Status::Ok;
 }
 
 }  // namespace
@@ -216,7 +217,7 @@ Status GifWrite(PictureRecord& picture, const WriteOptions& options) {
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
   WriteHeader(out, picture, options.encode.gif89);
   if (options.encode.gif89) WriteComment(out, picture.comment);
-  WritePixels(out, picture, options.encode.gifInterlaced);
+  RETURN_IF_BAD(WritePixels(out, picture, options.encode.gifInterlaced));
   out.U8(kEndBlock);
   return CommitOutput(out, options);
 }

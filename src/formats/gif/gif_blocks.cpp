@@ -90,6 +90,7 @@ Status ParseScreen(ByteReader& bytes, GifScreen& screen) {
 
 Status NextFrame(ByteReader& bytes, GifScreen& screen, GifFrame& frame, GifRemarks* remarks) {
   frame = {};
+  uint64_t garbage = 0;
   while (bytes.Left() > 0) {
     const uint8_t block = bytes.U8();
     if (block == kEndBlock) return Status::NoImages;
@@ -97,7 +98,10 @@ Status NextFrame(ByteReader& bytes, GifScreen& screen, GifFrame& frame, GifRemar
       ParseFrame(bytes, screen, frame);
       return bytes.Ok() ? Status::Ok : Status::FileReadError;
     }
-    if (block != kExtensionBlock) continue;
+    if (block != kExtensionBlock) {
+      if (++garbage > limits.garbageBytes) return Status::DamagedFile;
+      continue;
+    }
     const uint8_t label = bytes.U8();
     if (label == kGraphicControl) {
       ParseGraphicControl(bytes, frame);

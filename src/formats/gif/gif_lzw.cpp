@@ -62,7 +62,7 @@ void CopyString(uint8_t* to, const uint8_t* from, uint64_t length) {
 Status DecodeGifPixels(ByteReader& bytes, std::span<uint8_t> pixels) {
   const uint32_t pixelBits = bytes.U8();
   if (!bytes.Ok()) return Status::FileReadError;
-  if (pixelBits < 1 || pixelBits > 8) return Status::DamagedFile;
+  if (pixelBits < 1 || pixelBits >= kMostCodeBits) return Status::DamagedFile;
   const uint32_t clearCode = 1u << pixelBits, endCode = clearCode + 1;
   DecodedString strings[kMostCodes];
   CodeReader codes(bytes);

@@ -309,7 +309,7 @@ Status HdpRead(PictureRecord& picture, const ReadRequest& request) {
   RETURN_IF_BAD(Describe(file.Bytes(), request.page, page, picture));
   RETURN_IF_BAD(CheckPackedSize(picture.width, picture.height, picture.bitsPerPixel));
   HdpRaster raster;
-  RETURN_IF_BAD(DecodeHdp(page, raster, [&](int32_t rows) { picture.ReportRow(rows); }));
+  RETURN_IF_BAD(DecodeHdp(page, raster, [&](int32_t rows) { (void)picture.ReportRow(rows); }));
   if (!file.Intact()) return Status::FileReadError;
   HdpTarget target;
   RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette, picture.bitsPerPixel, target.image));
@@ -317,7 +317,7 @@ Status HdpRead(PictureRecord& picture, const ReadRequest& request) {
   HdpConverter converter(page, raster, target);
   for (int32_t y = 0; y < picture.height; ++y) {
     converter.Store(y);
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
   }
   picture.image = std::move(target.image);
   picture.alpha = std::move(target.alpha);

@@ -160,7 +160,7 @@ Status WriteAll(ByteWriter& out, PictureRecord& picture, const WriteOptions& opt
   const uint64_t start = out.Position();
   const HdpEncoding encoding = {std::clamp<int32_t>(options.encode.hdpCompression, 0, 255),
                                 (options.encode.hdpBits & kInFrequencyOrder) != 0};
-  RETURN_IF_BAD(EncodeHdp(source, encoding, out, [&](int32_t row) { picture.ReportRow(row); }));
+  RETURN_IF_BAD(EncodeHdp(source, encoding, out, [&](int32_t row) { (void)picture.ReportRow(row); }));
   if (out.Position() > UINT32_MAX) return Status::UnsuitableImage;
   out.PatchLe32(directory.PlaceOf(kHdpImageOffset), static_cast<uint32_t>(start));
   out.PatchLe32(directory.PlaceOf(kHdpImageSize), static_cast<uint32_t>(out.Position() - start));

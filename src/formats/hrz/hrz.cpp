@@ -62,7 +62,7 @@ Status HrzRead(PictureRecord& picture, const ReadRequest& request) {
       row[1] = Widened(source[1]);
       row[2] = Widened(source[0]);
     }
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
   }
   if (!file.Intact()) return Status::FileReadError;
   picture.image = std::move(image);
@@ -78,7 +78,7 @@ Status HrzWrite(PictureRecord& picture, const WriteOptions& options) {
   BgrRows rows;
   RETURN_IF_BAD(rows.Open(picture.image));
   for (int32_t y = 0; y < kHeight; ++y) {
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
     const uint8_t* bgr = rows.Row(y);
     std::array<uint8_t, kRowSize> bytes;
     for (size_t i = 0; i < bytes.size(); i += 3) {

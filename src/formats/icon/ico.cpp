@@ -50,6 +50,7 @@ constexpr uint32_t kSizeOffset = kFileHeaderSize + 8;  // of the first entry's s
 
 struct IcoEntry {
   uint16_t hotSpotX = 0, hotSpotY = 0;  // of a cursor
+  uint16_t claimedBits = 32;            // of the directory, for pictures that do not tell
   std::span<const uint8_t> bytes;       // its picture, and all that follows in the file
 };
 
@@ -68,6 +69,7 @@ Status ParseDirectory(std::span<const uint8_t> file, IcoFile& icons) {
     IcoEntry entry;
     entry.hotSpotX = bytes.Le16();
     entry.hotSpotY = bytes.Le16();
+    entry.claimedBits = icons.cursors || entry.hotSpotY == 0 || entry.hotSpotY > 32 ? uint16_t{32} : entry.hotSpotY;
     bytes.Skip(4);  // the size is often wrong; the picture itself knows better
     const uint64_t offset = bytes.Le32();
     if (!bytes.Ok()) return Status::FileReadError;
@@ -133,7 +135,7 @@ uint64_t Rank(const IcoEntry& entry) {
     ByteReader bytes(entry.bytes);
     bytes.Seek(16);  // width and height of the first chunk
     const uint64_t width = bytes.Be32(), height = bytes.Be32();
-    return width > UINT16_MAX || height > UINT16_MAX ? 0 : width * height * 64 + 32;
+    return width > UINT16_MAX || height > UINT16_MAX ? 0 : width * height * 64 + entry.claimedBits;
   }
   IcoBitmap bitmap;
   if (ParseBitmap(entry.bytes, bitmap) != Status::Ok) return 0;
@@ -219,7 +221,7 @@ Status ReadBitmap(const IcoBitmap& bitmap, PictureRecord& picture, PackedImage& 
       const auto column = static_cast<size_t>(x);
       alpha.StoredRow(r)[column] = alphaBytes ? source[4 * column + 3] : bitmap.Masked(x, r) ? 0 : 255;
     }
-    picture.ReportRow(r);
+    RETURN_IF_BAD(picture.ReportRow(r));
   }
   return Status::Ok;
 }
@@ -313,10 +315,10 @@ void WriteBitmapHeader(ByteWriter& out, const PictureRecord& picture, const IcoL
   }
 }
 
-void WriteColors(ByteWriter& out, const PictureRecord& picture, const IcoLayout& layout) {
+Status WriteColors(ByteWriter& out, const PictureRecord& picture, const IcoLayout& layout) {
   for (int32_t r = 0; r < picture.image.Height(); ++r) {
     const auto row = picture.image.StoredRow(r);
-    picture.ReportRow(r);
+    RETURN_IF_BAD(picture.ReportRow(r));
     if (layout.bits != 32) {
       out.Bytes(row);
       continue;
@@ -327,6 +329,7 @@ void WriteColors(ByteWriter& out, const PictureRecord& picture, const IcoLayout&
       out.U8(alpha[x]);
     }
   }
+  return Status::Ok;
 }
 
 // Pixels of less than half opacity are transparent for programs that know the mask alone.
@@ -382,7 +385,7 @@ Status IcoWrite(PictureRecord& picture, const WriteOptions& options) {
     out.PatchLe32(kSizeOffset, static_cast<uint32_t>(out.Position()) - kFileHeaderSize - kEntrySize);
   } else {
     WriteBitmapHeader(out, picture, layout);
-    WriteColors(out, picture, layout);
+    RETURN_IF_BAD(WriteColors(out, picture, layout));
     WriteMask(out, picture);
   }
   return CommitOutput(out, options);

@@ -18,6 +18,7 @@
 #include "formats/jpeg/jpeg.h"
 
 #include <algorithm>
+#include <array>
 #include <cmath>
 #include <cstring>
 #include <string_view>
@@ -38,20 +39,12 @@ namespace {
 
 constexpr std::string_view kIccHead("ICC_PROFILE\0", 12);
 constexpr int kApp1 = JPEG_APP0 + 1, kApp2 = JPEG_APP0 + 2;
-constexpr unsigned kWholeSegment = 0xFFFF;
-
-// Reads up to the first scan, keeping the segments that travel.
-Status ReadHeader(JpegReader& reader, std::span<const uint8_t> file) {
-  return ReadJpegHeader(reader, file, [](j_decompress_ptr info) {
-    for (const int marker : {kApp1, kApp2, JPEG_COM}) jpeg_save_markers(info, marker, kWholeSegment);
-  });
-}
 
 bool IsGray(const jpeg_decompress_struct& info) { return info.jpeg_color_space == JCS_GRAYSCALE; }
 bool IsCmyk(const jpeg_decompress_struct& info) { return info.jpeg_color_space == JCS_CMYK || info.jpeg_color_space == JCS_YCCK; }
 
-std::string_view DataOf(const jpeg_marker_struct& marker) {
-  return {static_cast<const char*>(static_cast<const void*>(marker.data)), marker.data_length};
+std::string_view DataOf(const JpegSegment& segment) {
+  return {static_cast<const char*>(static_cast<const void*>(segment.data.data())), segment.data.size()};
 }
 
 void Append(std::vector<uint8_t>& block, std::string_view data) {
@@ -59,34 +52,33 @@ void Append(std::vector<uint8_t>& block, std::string_view data) {
 }
 
 // The profile's pieces may come in any order; each names its number from 1 and how many there are.
-void JoinProfile(const jpeg_decompress_struct& info, std::vector<uint8_t>& profile) {
-  for (unsigned wanted = 1; wanted <= 255; ++wanted) {
-    bool found = false;
-    for (jpeg_saved_marker_ptr marker = info.marker_list; marker != nullptr && !found; marker = marker->next) {
-      const std::string_view data = DataOf(*marker);
-      found =
-          marker->marker == kApp2 && data.starts_with(kIccHead) && data.size() > 14 && static_cast<uint8_t>(data[12]) == wanted;
-      if (found) Append(profile, data.substr(14));
-    }
-    if (!found) return;
+void JoinProfile(const JpegReader& reader, std::vector<uint8_t>& profile) {
+  std::array<std::string_view, 256> pieces = {};
+  for (const JpegSegment& segment : reader.segments) {
+    const std::string_view data = DataOf(segment);
+    if (segment.marker != kApp2 || !data.starts_with(kIccHead) || data.size() <= 14) continue;
+    std::string_view& piece = pieces[static_cast<uint8_t>(data[12])];
+    if (piece.empty()) piece = data.substr(14);
   }
+  for (size_t i = 1; i < pieces.size() && !pieces[i].empty(); ++i) Append(profile, pieces[i]);
 }
 
-void TakeMetadata(const jpeg_decompress_struct& info, PictureRecord& picture) {
+void TakeMetadata(const JpegReader& reader, PictureRecord& picture) {
+  const jpeg_decompress_struct& info = reader.info;
   PictureMetadata& metadata = picture.metadata;
   metadata = {};
   picture.comment.clear();
-  for (jpeg_saved_marker_ptr marker = info.marker_list; marker != nullptr; marker = marker->next) {
-    const std::string_view data = DataOf(*marker);
-    if (marker->marker == JPEG_COM) {
+  for (const JpegSegment& segment : reader.segments) {
+    const std::string_view data = DataOf(segment);
+    if (segment.marker == JPEG_COM) {
       if (picture.comment.empty()) Append(picture.comment, data.substr(0, data.find('\0')));
-    } else if (marker->marker == kApp1 && data.starts_with(kExifHead) && metadata.exif.empty()) {
+    } else if (segment.marker == kApp1 && data.starts_with(kExifHead) && metadata.exif.empty()) {
       Append(metadata.exif, data.substr(kExifHead.size()));
-    } else if (marker->marker == kApp1 && data.starts_with(kXmpHead) && metadata.xmp.empty()) {
+    } else if (segment.marker == kApp1 && data.starts_with(kXmpHead) && metadata.xmp.empty()) {
       Append(metadata.xmp, data.substr(kXmpHead.size()));
     }
   }
-  JoinProfile(info, metadata.icc);
+  JoinProfile(reader, metadata.icc);
   if (info.saw_JFIF_marker && (info.density_unit == 1 || info.density_unit == 2)) {
     const double perInch = info.density_unit == 2 ? 2.54 : 1;
     metadata.dpiX = info.X_density * perInch;
@@ -94,7 +86,8 @@ void TakeMetadata(const jpeg_decompress_struct& info, PictureRecord& picture) {
   }
 }
 
-Status DescribePicture(const jpeg_decompress_struct& info, PictureRecord& picture) {
+Status DescribePicture(const JpegReader& reader, PictureRecord& picture) {
+  const jpeg_decompress_struct& info = reader.info;
   picture.typeName.AssignCut(info.progressive_mode ? "Progressive JPEG" : "JPEG");
   picture.width = static_cast<int32_t>(info.image_width);
   picture.height = static_cast<int32_t>(info.image_height);
@@ -105,7 +98,7 @@ Status DescribePicture(const jpeg_decompress_struct& info, PictureRecord& pictur
   } else {
     MakeDefaultPalette(&picture.palette, nullptr, kDisplayPalette);
   }
-  TakeMetadata(info, picture);
+  TakeMetadata(reader, picture);
   return picture.width < 1 || picture.height < 1 ? Status::DamagedFile : Status::Ok;
 }
 
@@ -121,13 +114,11 @@ void SetOutput(jpeg_decompress_struct& info, int32_t thumbnailSide) {
   jpeg_calc_output_dimensions(&info);
 }
 
-// Ink to light. Adobe's programs store 255 for no ink, the standard's reading is the reverse.
-void CmykToBgr(const uint8_t* ink, uint8_t* color, size_t width, bool inverted) {
+// Ink to light. 255 stands for no ink: so Adobe's programs store it, and files without their marker are read like theirs.
+void CmykToBgr(const uint8_t* ink, uint8_t* color, size_t width) {
   for (size_t x = 0; x < width; ++x, ink += 4, color += 3) {
     for (size_t i = 0; i < 3; ++i) {
-      const uint32_t tint = inverted ? ink[2 - i] : 255u - ink[2 - i];
-      const uint32_t key = inverted ? ink[3] : 255u - ink[3];
-      color[i] = static_cast<uint8_t>((tint * key + 127) / 255);
+      color[i] = static_cast<uint8_t>((uint32_t{ink[2 - i]} * ink[3] + 127) / 255);
     }
   }
 }
@@ -136,18 +127,21 @@ Status ReadPixels(JpegReader& reader, const PictureRecord& picture, PackedImage&
   jpeg_decompress_struct& info = reader.info;
   const bool cmyk = info.out_color_space == JCS_CMYK;
   std::vector<uint8_t> ink(cmyk ? 4 * static_cast<size_t>(info.output_width) : 0);
+  reader.stop = picture.stop;
+  Status status = Status::Ok;
   const bool read = Guarded(reader.errors, [&] {
     jpeg_start_decompress(&info);
-    while (info.output_scanline < info.output_height) {
+    while (info.output_scanline < info.output_height && status == Status::Ok) {
       const auto y = static_cast<int32_t>(info.output_scanline);
       uint8_t* target = image.Row(y).data();
       JSAMPROW row = cmyk ? ink.data() : target;
       jpeg_read_scanlines(&info, &row, 1);
-      if (cmyk) CmykToBgr(ink.data(), target, info.output_width, info.saw_Adobe_marker);
-      picture.ReportRow(y, image.Height());
+      if (cmyk) CmykToBgr(ink.data(), target, info.output_width);
+      status = picture.ReportRow(y, image.Height());
     }
   });
   if (!read) return reader.Failure();
+  RETURN_IF_BAD(status);
   return reader.errors.cutShort && reader.errors.endMissing ? Status::FileReadError : Status::Ok;
 }
 
@@ -271,19 +265,20 @@ Status WriteAll(JpegWriter& writer, PictureRecord& picture, const WriteOptions& 
   const PackedImage& image = picture.image;
   const bool gray = HasOnlyGrays(picture.palette, image.Colors());
   std::vector<uint8_t> expanded(image.Bits() == 24 ? 0 : (gray ? 1 : 3) * static_cast<size_t>(image.Width()));
+  Status status = Status::Ok;
   const bool written = Guarded(writer.errors, [&] {
     SetParameters(writer, picture, gray, options.encode);
     jpeg_start_compress(&writer.info, TRUE);
     if (options.KeepsMetadata()) WriteMetadata(writer.info, picture);
-    for (int32_t y = 0; y < image.Height(); ++y) {
+    for (int32_t y = 0; y < image.Height() && status == Status::Ok; ++y) {
       if (!expanded.empty()) ExpandRow(picture, y, gray, expanded);
       JSAMPROW row = expanded.empty() ? const_cast<JSAMPROW>(image.Row(y).data()) : expanded.data();
       jpeg_write_scanlines(&writer.info, &row, 1);
-      picture.ReportRow(y);
+      status = picture.ReportRow(y);
     }
-    jpeg_finish_compress(&writer.info);
+    if (status == Status::Ok) jpeg_finish_compress(&writer.info);
   });
-  return written ? Status::Ok : Status::ErrorWritingFile;
+  return written ? status : Status::ErrorWritingFile;
 }
 
 const char* ColorSpaceName(J_COLOR_SPACE space) {
@@ -324,8 +319,8 @@ Status JpegInfo(PictureRecord& picture, const ReadRequest& request) {
   if (!file.Open(request.fileName)) return Status::FileOpenError;
   picture.fileSize = file.FileSize();
   JpegReader reader;
-  RETURN_IF_BAD(ReadHeader(reader, file.Bytes()));
-  return DescribePicture(reader.info, picture);
+  RETURN_IF_BAD(ReadJpegHeader(reader, file.Bytes()));
+  return DescribePicture(reader, picture);
 }
 
 Status JpegRead(PictureRecord& picture, const ReadRequest& request) {
@@ -333,18 +328,21 @@ Status JpegRead(PictureRecord& picture, const ReadRequest& request) {
   picture.image.Free();
   picture.alpha.Free();
   picture.warning.Clear();
+  picture.note.Clear();
   platform::FileView file;
   if (!file.Open(request.fileName)) return Status::FileOpenError;
   JpegReader reader;
-  RETURN_IF_BAD(ReadHeader(reader, file.Bytes()));
-  RETURN_IF_BAD(DescribePicture(reader.info, picture));
+  RETURN_IF_BAD(ReadJpegHeader(reader, file.Bytes()));
+  RETURN_IF_BAD(DescribePicture(reader, picture));
   if (!Guarded(reader.errors, [&] { SetOutput(reader.info, request.thumbnailSide); })) return reader.Failure();
   PackedImage image;
-  RETURN_IF_BAD(NewPackedImage(static_cast<int32_t>(reader.info.output_width), static_cast<int32_t>(reader.info.output_height),
-                               &picture.palette, picture.bitsPerPixel, image));
+  const auto width = static_cast<int32_t>(reader.info.output_width), height = static_cast<int32_t>(reader.info.output_height);
+  RETURN_IF_BAD(CheckFileMemory(JpegCoefficientBytes(reader, false) + PackedRowBytes(width, height, picture.bitsPerPixel)));
+  RETURN_IF_BAD(NewPackedImage(width, height, &picture.palette, picture.bitsPerPixel, image));
   RETURN_IF_BAD(ReadPixels(reader, picture, image));
   if (!file.Intact()) return Status::FileReadError;
   picture.warning.AssignCut(reader.errors.warning);
+  picture.note.AssignCut(reader.errors.note);
   picture.reduction = static_cast<int32_t>(reader.info.scale_denom / reader.info.scale_num);
   picture.image = std::move(image);
   return Status::Ok;
@@ -354,6 +352,10 @@ Status JpegWrite(PictureRecord& picture, const WriteOptions& options) {
   const ProgressScope progress(picture);
   if (picture.image.Empty()) return Status::MemoryAllocationError;
   if (picture.image.Width() > JPEG_MAX_DIMENSION || picture.image.Height() > JPEG_MAX_DIMENSION) return Status::UnsuitableImage;
+  const uint64_t pixels = static_cast<uint64_t>(picture.image.Width()) * static_cast<uint64_t>(picture.image.Height());
+  const uint64_t coefficients = picture.image.Bits() == 24 ? 3 * sizeof(JCOEF) * pixels : sizeof(JCOEF) * pixels;
+  const uint64_t held = picture.image.Bytes().size() + picture.alpha.Bytes().size();
+  RETURN_IF_BAD(CheckFileMemory(held + (options.encode.jpegProgressive ? coefficients : 0)));
   JpegWriter writer;
   if (!writer.out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
   RETURN_IF_BAD(WriteAll(writer, picture, options));
@@ -365,8 +367,8 @@ Status JpegDetails(PictureRecord& picture) {
   platform::FileView file;
   if (!file.Open(picture.fileName.c_str())) return Status::FileOpenError;
   JpegReader reader;
-  RETURN_IF_BAD(ReadHeader(reader, file.Bytes()));
-  TakeMetadata(reader.info, picture);
+  RETURN_IF_BAD(ReadJpegHeader(reader, file.Bytes()));
+  TakeMetadata(reader, picture);
   AddDetails(reader.info, picture, picture.detailLines);
   return Status::Ok;
 }

@@ -3,6 +3,9 @@
 #include <cstring>
 #include <string_view>
 
+#include "core/byte_reader.h"
+#include "core/limits.h"
+
 namespace fotomill {
 
 namespace {
@@ -29,15 +32,50 @@ void OnMessage(j_common_ptr common, int level) {
   } else if (message.find("premature end of data segment") != std::string_view::npos) {
     errors.cutShort = true;
   }
-  if (errors.warning[0] == 0 && !errors.endMissing) std::memcpy(errors.warning, text, sizeof text);
+  const bool damage = message.starts_with("Corrupt JPEG data") && message.find("extraneous bytes") == std::string_view::npos;
+  char* const place = damage ? errors.warning : errors.note;
+  if (place[0] == 0 && !errors.endMissing) std::memcpy(place, text, sizeof text);
 }
 
 void OutputNothing(j_common_ptr) {}
 
-// Called by the library now and then while it reads scans.
-void LimitScans(j_common_ptr common) {
+// Called by the library for each row of blocks, of every scan.
+void Watch(j_common_ptr common) {
   const auto* info = static_cast<const jpeg_decompress_struct*>(static_cast<void*>(common));
-  if (info->input_scan_number > kMostScans) common->err->error_exit(common);
+  const auto* reader = static_cast<const JpegReader*>(info->client_data);
+  ErrorsOf(common).stopped = reader->stop.Asked();
+  if (ErrorsOf(common).stopped || info->input_scan_number > kMostScans) common->err->error_exit(common);
+}
+
+// Whether a segment is one that travels with the picture.
+bool IsKept(const JpegSegment& segment) {
+  constexpr int kApp1 = JPEG_APP0 + 1, kApp2 = JPEG_APP0 + 2;
+  return segment.marker == JPEG_COM || segment.marker == kApp2 ||
+         (segment.marker == kApp1 && (segment.Starts(kExifHead) || segment.Starts(kXmpHead)));
+}
+
+// Walks to the first scan: keeps segments, the library's own way of which takes the square of their number, and refuses what
+// holds too little of a picture for its length, such as a hole of a terabyte behind the first bytes.
+Status WalkHead(JpegReader& reader, std::span<const uint8_t> file) {
+  ByteReader bytes(file);
+  bytes.Skip(2);
+  uint64_t garbage = 0;
+  while (bytes.Ok()) {
+    uint8_t byte = bytes.U8();
+    for (; byte != 0xFF && bytes.Ok(); byte = bytes.U8()) {
+      if (++garbage > limits.garbageBytes) return Status::DamagedFile;
+    }
+    for (; byte == 0xFF && bytes.Ok(); byte = bytes.U8()) {
+      if (++garbage > limits.garbageBytes) return Status::DamagedFile;
+    }
+    JpegSegment segment{.marker = byte, .data = {}, .whole = {}};
+    if (byte == 0xDA || byte == 0xD9) return Status::Ok;
+    if (byte == 0 || byte == 0x01 || (byte >= 0xD0 && byte <= 0xD8)) continue;
+    const uint16_t length = bytes.Be16();
+    segment.data = bytes.Take(length < 2 ? 0u : length - 2u);
+    if (bytes.Ok() && IsKept(segment) && reader.segments.size() < limits.jpegSegments) reader.segments.push_back(segment);
+  }
+  return Status::Ok;  // the library tells what is missing
 }
 
 }  // namespace
@@ -52,10 +90,11 @@ void JpegErrors::Set() {
 JpegReader::JpegReader() {
   errors.Set();
   info.err = &errors.base;
-  monitor.progress_monitor = LimitScans;
+  monitor.progress_monitor = Watch;
 }
 
 Status JpegErrors::Meaning(j_common_ptr common) {
+  if (stopped) return Status::FunctionCancelled;
   char text[JMSG_LENGTH_MAX];
   base.format_message(common, text);
   const std::string_view message(text);
@@ -64,17 +103,30 @@ Status JpegErrors::Meaning(j_common_ptr common) {
   return endMissing ? Status::FileReadError : Status::DamagedFile;
 }
 
-Status ReadJpegHeader(JpegReader& reader, std::span<const uint8_t> file, void (*prepare)(j_decompress_ptr info)) {
+Status ReadJpegHeader(JpegReader& reader, std::span<const uint8_t> file) {
   if (file.size() < 4) return Status::FileReadError;
   if (file[0] != 0xFF || file[1] != 0xD8) return Status::DamagedFile;
+  reader.segments.clear();
+  RETURN_IF_BAD(WalkHead(reader, file));
   const bool read = Guarded(reader.errors, [&] {
     jpeg_create_decompress(&reader.info);
+    reader.info.client_data = &reader;
     reader.info.progress = &reader.monitor;
     jpeg_mem_src(&reader.info, file.data(), file.size());
-    if (prepare != nullptr) prepare(&reader.info);
     jpeg_read_header(&reader.info, TRUE);
   });
   return read ? Status::Ok : reader.Failure();
+}
+
+uint64_t JpegCoefficientBytes(const JpegReader& reader, bool all) {
+  const jpeg_decompress_struct& info = reader.info;
+  const bool held = all || info.progressive_mode != 0 || info.comps_in_scan < info.num_components;
+  uint64_t blocks = 0;
+  for (int i = 0; held && i < info.num_components; ++i) {
+    const jpeg_component_info& component = info.comp_info[i];
+    blocks += (uint64_t{component.width_in_blocks} + MAX_SAMP_FACTOR) * (component.height_in_blocks + MAX_SAMP_FACTOR);
+  }
+  return blocks * sizeof(JBLOCK);
 }
 
 }  // namespace fotomill

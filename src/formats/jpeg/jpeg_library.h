@@ -8,8 +8,11 @@
 #include <jpeglib.h>
 
 #include <span>
+#include <vector>
 
+#include "containers/jpeg_segments.h"
 #include "core/status.h"
+#include "core/workers/stop_token.h"
 
 namespace fotomill {
 
@@ -19,8 +22,10 @@ struct JpegErrors {
   std::jmp_buf jump;
   bool cutShort = false;  // the data ended within a scan
   bool endMissing = false;
-  char warning[JMSG_LENGTH_MAX] = {};  // the first one, but for a missing end
+  char warning[JMSG_LENGTH_MAX] = {};  // the first one of damage, but for a missing end
+  char note[JMSG_LENGTH_MAX] = {};     // the first one of what is odd and harms no pixel
   int code = 0;
+  bool stopped = false;  // by the one who asked for the picture
 
   void Set();
   // What a failed library call means; `common` is what it was called for.
@@ -45,11 +50,17 @@ struct JpegReader {
 
   JpegErrors errors;
   jpeg_decompress_struct info = {};
-  jpeg_progress_mgr monitor = {};  // ends files of absurdly many scans
+  jpeg_progress_mgr monitor = {};  // ends files of absurdly many scans, and those that nobody wants any more
+  StopToken stop = {};
+  std::vector<JpegSegment> segments;  // those kept, in the order of the file
 };
 
-// Reads a file up to its first scan; `prepare` is called before and may ask for segments to be kept. `file` must stay until
-// the reader is done.
-Status ReadJpegHeader(JpegReader& reader, std::span<const uint8_t> file, void (*prepare)(j_decompress_ptr info) = nullptr);
+// Reads a file up to its first scan, keeping the segments of EXIF, XMP, profiles and comments. `file` must stay until the
+// reader is done.
+Status ReadJpegHeader(JpegReader& reader, std::span<const uint8_t> file);
+
+// Bytes of the arrays in which the library holds all coefficients of a picture: always for `all`, else only where its scans
+// come one after the other, whatever the size that it is decoded at. Known once the header is read.
+uint64_t JpegCoefficientBytes(const JpegReader& reader, bool all);
 
 }  // namespace fotomill

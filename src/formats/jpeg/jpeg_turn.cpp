@@ -14,8 +14,8 @@
 #include <cstdlib>
 #include <utility>
 
-#include "core/limits.h"
 #include "formats/jpeg/jpeg_library.h"
+#include "picture/packed_image.h"
 #include "texts/texts.h"
 
 namespace fotomill {
@@ -97,10 +97,9 @@ void Measure(JpegTurner& turner, Turn turn, bool trim, TurnedJpeg& turned) {
   turned.height = static_cast<int32_t>(turn.swap ? turner.width : turner.height);
 }
 
-// Where the blocks of each component are and will be. False when there are too many for the memory that a file may take.
-bool LayOut(JpegTurner& turner, Turn turn) {
+// Where the blocks of each component are and will be.
+void LayOut(JpegTurner& turner, Turn turn) {
   const jpeg_decompress_struct& old = turner.reader.info;
-  uint64_t blocks = 0;
   for (int i = 0; i < old.num_components; ++i) {
     const jpeg_component_info& component = old.comp_info[i];
     Plane& plane = turner.planes[static_cast<size_t>(i)];
@@ -117,9 +116,7 @@ bool LayOut(JpegTurner& turner, Turn turn) {
       std::swap(plane.width, plane.height);
       std::swap(plane.across, plane.down);
     }
-    blocks += (uint64_t{component.width_in_blocks} + MAX_SAMP_FACTOR) * (component.height_in_blocks + MAX_SAMP_FACTOR);
   }
-  return 2 * blocks * sizeof(JBLOCK) <= limits.packedBlockBytes;
 }
 
 // Reads all coefficients; an obstacle where they are flawed, which a new file would hide.
@@ -217,7 +214,9 @@ Status TurnJpeg(std::span<const uint8_t> file, Orientation orientation, bool tri
   JpegTurner turner;
   RETURN_IF_BAD(ReadJpegHeader(turner.reader, file));
   Measure(turner, turn, trim, turned);
-  if (turned.obstacle.empty() && !LayOut(turner, turn)) turned.obstacle = TrRecorded("The picture is too large.");
+  LayOut(turner, turn);
+  const bool fits = CheckFileMemory(2 * JpegCoefficientBytes(turner.reader, true)) == Status::Ok;  // the old and the new ones
+  if (turned.obstacle.empty() && !fits) turned.obstacle = TrRecorded("The picture is too large.");
   if (!turned.obstacle.empty()) return Status::Ok;
   RETURN_IF_BAD(ReadBlocks(turner, file, turned));
   if (!turned.obstacle.empty()) return Status::Ok;

@@ -205,7 +205,7 @@ Status MacRead(PictureRecord& picture, const ReadRequest& request) {
   bytes.Seek(RowsOffset(file.Bytes()));
   for (int32_t y = 0; y < kHeight; ++y) {
     RETURN_IF_BAD(UnpackRow(bytes, image.Row(y)));
-    picture.ReportRow(y, kHeight);
+    RETURN_IF_BAD(picture.ReportRow(y, kHeight));
   }
   if (!file.Intact()) return Status::FileReadError;
   picture.image = std::move(image);
@@ -222,7 +222,7 @@ Status MacWrite(PictureRecord& picture, const WriteOptions& options) {
   if (withMacBinary) WriteMacBinaryHeader(out, picture.fileName);
   WriteMacPaintHeader(out);
   for (int32_t y = 0; y < kHeight && !out.Failed(); ++y) {
-    picture.ReportRow(y, kHeight);
+    RETURN_IF_BAD(picture.ReportRow(y, kHeight));
     PackRow(out, PageRow(picture.image, y));
   }
   if (withMacBinary) out.PatchBe32(kLengthOffset, static_cast<uint32_t>(out.Position() - kMacBinarySize));

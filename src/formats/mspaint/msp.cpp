@@ -95,7 +95,7 @@ Status ReadRows(std::span<const uint8_t> file, const MspHeader& header, const Pi
     } else {
       std::ranges::copy(code, row.begin());
     }
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
   }
   return Status::Ok;
 }
@@ -146,7 +146,7 @@ Status WriteRows(ByteWriter& out, const PictureRecord& picture) {
   std::vector<uint8_t> row((width + 7) / 8), code, sizes;
   out.Zeros(2 * static_cast<uint64_t>(image.Height()));
   for (int32_t y = 0; y < image.Height() && !out.Failed(); ++y) {
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
     for (size_t i = 0; i < row.size(); ++i) row[i] = image.Row(y)[i] ^ invert;
     if (width % 8 != 0) row.back() |= static_cast<uint8_t>(0xff >> width % 8);
     EncodeRow(row, code);

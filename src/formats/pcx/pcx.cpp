@@ -245,16 +245,17 @@ void TakeColorPlanes(std::span<const uint8_t> row, int32_t width, const PcxLayou
   SplitColors(row.data(), count, red + 2 * count, red + count, red);
 }
 
-void WriteLines(ByteWriter& out, const PcxLayout& layout, const PictureRecord& picture, std::span<uint8_t> planes) {
+Status WriteLines(ByteWriter& out, const PcxLayout& layout, const PictureRecord& picture, std::span<uint8_t> planes) {
   const PackedImage& image = picture.image;
   const TakePlanes take = layout.depth == 24 ? TakeColorPlanes : layout.planes > 1 ? TakeBitPlanes : TakePlane;
   for (int32_t y = 0; y < image.Height() && !out.Failed(); ++y) {
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
     take(image.Row(y), image.Width(), layout, planes);
     for (size_t begin = 0; begin < planes.size(); begin += layout.bytesPerLine) {
       out.Used(EncodePcxPlane(planes.subspan(begin, layout.bytesPerLine), out.Reserve(2 * size_t{layout.bytesPerLine})));
     }
   }
+  return Status::Ok;
 }
 
 }  // namespace
@@ -279,7 +280,7 @@ Status ReadPcx(platform::FileView& file, const PcxPlace& place, PictureRecord& p
     if (!decoder.Decode(line.Data(), header.LineSize())) return Status::FileReadError;
     spread(decoded, header, image.Row(y));
     file.DropBefore(static_cast<uint64_t>(decoder.Next() - file.Bytes().data()));
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
   }
   if (!file.Intact()) return Status::FileReadError;
   picture.image = std::move(image);
@@ -292,7 +293,7 @@ Status WritePcx(ByteWriter& out, const PictureRecord& picture) {
   platform::MemoryBlock planes;
   if (!planes.Allocate(uint64_t{layout.bytesPerLine} * layout.planes)) return Status::MemoryAllocationError;
   WriteHeader(out, layout, picture);
-  WriteLines(out, layout, picture, planes.Bytes());
+  RETURN_IF_BAD(WriteLines(out, layout, picture, planes.Bytes()));
   if (layout.depth == 8) {
     out.U8(kTrailerMark);
     out.Bytes(picture.palette);

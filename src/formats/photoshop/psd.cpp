@@ -178,7 +178,7 @@ Status ReadMerged(const PsdFile& document, const PictureRecord& picture, PackedI
     } else if (document.transparentIndex >= 0) {
       for (size_t x = 0; x < width; ++x) alpha.Row(y)[x] = row[x] == document.transparentIndex ? 0 : 255;
     }
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
   }
   return Status::Ok;
 }
@@ -212,7 +212,7 @@ Status ReadLayer(const PsdFile& document, const PsdLayer& layer, const PictureRe
   std::vector<uint8_t> row(samples * static_cast<size_t>(width)), opacityRow(static_cast<size_t>(width), 255);
   const auto canvasWidth = static_cast<size_t>(header.width);
   for (int32_t i = 0; i < height; ++i) {
-    picture.ReportRow(i, height);
+    RETURN_IF_BAD(picture.ReportRow(i, height));
     const int64_t y = int64_t{layer.top} + i;
     if (y >= header.height) break;
     RETURN_IF_BAD(maker.Next(ofColors, row));

@@ -118,7 +118,7 @@ class ChannelRows {
   uint8_t invert_ = 0;
 };
 
-void WriteRows(ByteWriter& out, const PictureRecord& picture, PsdMode mode) {
+Status WriteRows(ByteWriter& out, const PictureRecord& picture, PsdMode mode) {
   const int32_t height = picture.image.Height();
   const size_t channels = mode == PsdMode::Rgb ? 3 : 1;
   std::vector<uint8_t> code(MostPackedBits(static_cast<size_t>(picture.image.Width()))), sizes;
@@ -132,10 +132,11 @@ void WriteRows(ByteWriter& out, const PictureRecord& picture, PsdMode mode) {
       sizes.push_back(static_cast<uint8_t>(size >> 8));
       sizes.push_back(static_cast<uint8_t>(size));
       out.Bytes(std::span(code).first(size));
-      picture.ReportRow(static_cast<int32_t>((c * static_cast<size_t>(height) + static_cast<size_t>(y)) / channels), height);
+      RETURN_IF_BAD(picture.ReportRow(static_cast<int32_t>((c * static_cast<size_t>(height) + static_cast<size_t>(y)) / channels), height));
     }
   }
   if (!out.Failed()) out.Patch(place, sizes);
+  return Status::Ok;
 }
 
 }  // namespace
@@ -156,7 +157,7 @@ Status PsdWrite(PictureRecord& picture, const WriteOptions& options) {
   }
   WriteResources(out, picture, options.KeepsMetadata());
   out.Be32(0);  // no layers
-  WriteRows(out, picture, mode);
+  RETURN_IF_BAD(WriteRows(out, picture, mode));
   return CommitOutput(out, options);
 }
 

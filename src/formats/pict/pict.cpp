@@ -104,7 +104,7 @@ Status ReadPiece(const PictPixels& pixels, const View& view, const PictureRecord
       const auto first = 3 * static_cast<size_t>(shown.x - pixels.bounds.x);
       std::ranges::copy(rows.Colors().subspan(first, 3 * static_cast<size_t>(shown.width)), image.Row(y).begin());
     }
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
   }
   return Status::Ok;
 }
@@ -161,7 +161,7 @@ Status ReadCanvas(const PictFile& pict, const PictureRecord& picture, PackedImag
     Rectangle target = pixels.target;
     target.x -= pict.frame.x;
     target.y -= pict.frame.y;
-    picture.ReportRow(done++, static_cast<int32_t>(pict.pixels.size()));
+    RETURN_IF_BAD(picture.ReportRow(done++, static_cast<int32_t>(pict.pixels.size())));
     if (target.width < 1 || target.height < 1) continue;
     drawn += PixelsOn(image, target);
     if (drawn > kMostOverdraw * PixelsOn(image, {0, 0, image.Width(), image.Height()})) return Status::UnsupportedFormat;
@@ -217,7 +217,7 @@ Status PictRead(PictureRecord& picture, const ReadRequest& request) {
     const Rectangle whole{0, 0, view.width, view.height};
     RETURN_IF_BAD(ReadJpeg(pict.pixels.front().data, [&](std::span<const uint8_t> bgr, int32_t y, int32_t height) {
       DrawRow(bgr, y, height, whole, image);
-      picture.ReportRow(y, height);
+      (void)picture.ReportRow(y, height);
     }));
   } else {
     RETURN_IF_BAD(ReadPiece(pict.pixels.front(), view, picture, image));

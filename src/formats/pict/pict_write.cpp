@@ -66,11 +66,11 @@ void GatherRow(const PictureRecord& picture, int32_t y, std::span<uint8_t> parts
   }
 }
 
-void WriteRows(ByteWriter& out, const PictureRecord& picture) {
+Status WriteRows(ByteWriter& out, const PictureRecord& picture) {
   const auto width = static_cast<size_t>(picture.image.Width());
   std::vector<uint8_t> parts(3 * width), code(MostPackedBits(3 * width));
   for (int32_t y = 0; y < picture.image.Height() && !out.Failed(); ++y) {
-    picture.ReportRow(y, picture.image.Height());
+    RETURN_IF_BAD(picture.ReportRow(y, picture.image.Height()));
     GatherRow(picture, y, parts);
     if (4 * width < 8) {  // too short to be packed: a byte of nothing, red, green, blue
       for (size_t x = 0; x < width; ++x) {
@@ -87,6 +87,7 @@ void WriteRows(ByteWriter& out, const PictureRecord& picture) {
     }
     out.Bytes(std::span(code).first(size));
   }
+  return Status::Ok;
 }
 
 }  // namespace
@@ -100,7 +101,7 @@ Status PictWrite(PictureRecord& picture, const WriteOptions& options) {
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
   WriteHead(out, image);
   WritePixelMap(out, image);
-  WriteRows(out, picture);
+  RETURN_IF_BAD(WriteRows(out, picture));
   out.Zeros(out.Position() % 2);
   out.Be16(0x00ff);
   const uint64_t size = out.Position() - kPreamble;

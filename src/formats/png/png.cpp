@@ -25,6 +25,7 @@
 #include "core/limits.h"
 #include "formats/png/png_library.h"
 #include "formats/png/png_pixels.h"
+#include "formats/png/png_text.h"
 #include "picture/gray_palette.h"
 #include "platform/file_view.h"
 #include "processing/pixel_rows.h"
@@ -35,6 +36,7 @@ namespace {
 
 constexpr png_uint_32 kMostSide = 0x7fffffff;
 constexpr png_alloc_size_t kMostChunkMemory = 64u << 20;
+constexpr png_byte kTextChunks[] = "tEXt\0zTXt\0iTXt";
 
 // A file being read, with the library's two structures.
 struct PngReader {
@@ -93,6 +95,8 @@ Status ReadHeader(PngReader& reader) {
     png_set_read_fn(reader.png, &reader, ReadBytes);
     png_set_user_limits(reader.png, kMostSide, kMostSide);
     png_set_chunk_malloc_max(reader.png, kMostChunkMemory);
+    // The library would inflate every text there is.
+    png_set_keep_unknown_chunks(reader.png, PNG_HANDLE_CHUNK_NEVER, kTextChunks, 3);
     png_read_info(reader.png, reader.info);
   });
   return read ? Status::Ok : reader.Failure();
@@ -151,16 +155,18 @@ void Assign(std::vector<uint8_t>& block, const uint8_t* data, size_t size) {
   if (data != nullptr && size <= limits.metadataBytes) block.assign(data, data + size);
 }
 
-void TakeTexts(const PngReader& reader, PictureRecord& picture) {
-  png_textp texts = nullptr;
-  int count = 0;
-  png_get_text(reader.png, reader.info, &texts, &count);
-  for (int i = 0; i < count; ++i) {
-    const size_t size = std::max(texts[i].text_length, texts[i].itxt_length);
-    const auto* text = reinterpret_cast<const uint8_t*>(texts[i].text);
-    if (std::strcmp(texts[i].key, kPngXmpKeyword) == 0) Assign(picture.metadata.xmp, text, size);
-    if (std::strcmp(texts[i].key, "Comment") == 0) Assign(picture.comment, text, size);
+// The two texts that travel with a picture, the last of each name; no others are inflated.
+void TakeTexts(std::span<const uint8_t> file, PictureRecord& picture) {
+  PngChunks chunks(file);
+  PngChunk chunk, xmp, comment;
+  while (chunks.Next(chunk) && chunk.type != "IDAT") {
+    if (chunk.type != "tEXt" && chunk.type != "zTXt" && chunk.type != "iTXt") continue;
+    const std::string_view keyword = PngTextKeyword(chunk);
+    if (keyword == kPngXmpKeyword) xmp = chunk;
+    if (keyword == "Comment") comment = chunk;
   }
+  if (!xmp.type.empty()) picture.metadata.xmp = PngTextOf(xmp, limits.pngTextBytes);
+  if (!comment.type.empty()) picture.comment = PngTextOf(comment, limits.pngTextBytes);
 }
 
 void TakeMetadata(const PngReader& reader, PictureRecord& picture) {
@@ -175,7 +181,7 @@ void TakeMetadata(const PngReader& reader, PictureRecord& picture) {
   if (png_get_iCCP(reader.png, reader.info, &name, &method, &profile, &profileSize) != 0) {
     Assign(picture.metadata.icc, profile, profileSize);
   }
-  TakeTexts(reader, picture);
+  TakeTexts(reader.file, picture);
   png_uint_32 x = 0, y = 0;
   int unit = 0;
   if (png_get_pHYs(reader.png, reader.info, &x, &y, &unit) != 0 && unit == PNG_RESOLUTION_METER) {
@@ -184,14 +190,18 @@ void TakeMetadata(const PngReader& reader, PictureRecord& picture) {
   }
 }
 
-// The number of frames that an animation's acTL chunk names, 1 for a still picture. It stands before the pixels.
+// The number of frames that an animation's acTL chunk names, as far as the file has them, 1 for a still picture. The chunk
+// stands before the pixels, and each frame has an fcTL chunk.
 int32_t FrameCount(std::span<const uint8_t> file) {
   PngChunks chunks(file);
   PngChunk chunk;
-  while (chunks.Next(chunk) && chunk.type != "IDAT") {
-    if (chunk.type == "acTL") return static_cast<int32_t>(std::clamp<uint32_t>(ByteReader(chunk.data).Be32(), 1, 1 << 20));
+  uint32_t named = 0, there = 0;
+  while ((named == 0 || there < named) && chunks.Next(chunk)) {
+    if (chunk.type == "IDAT" && named == 0) break;
+    if (chunk.type == "acTL") named = std::min(ByteReader(chunk.data).Be32(), limits.animationFrames);
+    if (chunk.type == "fcTL") ++there;
   }
-  return 1;
+  return static_cast<int32_t>(std::max(std::min(named, there), 1u));
 }
 
 // Fills the facts.
@@ -235,15 +245,16 @@ void StoreRow(const PngLayout& layout, const uint8_t* source, int32_t y, PngTarg
 // Rows that come in order: straight into the picture, or through one row.
 Status ReadInOrder(PngReader& reader, const PngLayout& layout, const PictureRecord& picture, PngTarget& target) {
   std::vector<uint8_t> row(png_get_rowbytes(reader.png, reader.info));
+  Status status = Status::Ok;
   const bool read = PngGuarded(reader.png, [&] {
-    for (int32_t y = 0; y < layout.height; ++y) {
+    for (int32_t y = 0; y < layout.height && status == Status::Ok; ++y) {
       const bool direct = layout.rows == RowForm::Direct;
       png_read_row(reader.png, direct ? target.image.Row(y).data() : row.data(), nullptr);
       if (!direct) StoreRow(layout, row.data(), y, target);
-      picture.ReportRow(y);
+      status = picture.ReportRow(y);
     }
   });
-  return read ? Status::Ok : reader.Failure();
+  return read ? status : reader.Failure();
 }
 
 // Interlaced rows come in seven passes, each of which fills in pixels, so all of them must be held.
@@ -256,17 +267,21 @@ Status ReadInterlaced(PngReader& reader, const PngLayout& layout, const PictureR
   const auto rowAt = [&](int32_t y) {
     return buffer.Empty() ? target.image.Row(y).data() : buffer.Data() + rowBytes * static_cast<uint64_t>(y);
   };
+  Status status = Status::Ok;
   const bool read = PngGuarded(reader.png, [&] {
     constexpr int kPasses = 7;
     for (int pass = 0; pass < kPasses; ++pass) {
-      for (int32_t y = 0; y < layout.height; ++y) png_read_row(reader.png, rowAt(y), nullptr);
-      picture.ReportRow(layout.height / kPasses * pass);
+      for (int32_t y = 0; y < layout.height && status == Status::Ok; ++y) {
+        png_read_row(reader.png, rowAt(y), nullptr);
+        status = picture.ReportRow(layout.height / kPasses * pass);
+      }
     }
   });
   if (!read) return reader.Failure();
+  RETURN_IF_BAD(status);
   for (int32_t y = 0; y < layout.height; ++y) {
     if (!buffer.Empty()) StoreRow(layout, rowAt(y), y, target);
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
   }
   return Status::Ok;
 }
@@ -350,29 +365,34 @@ StoreFileRow FileRowStore(const PngReader& reader, const PngLayout& layout) {
   return nullptr;
 }
 
-// All rows, inflated at once. False, with the target in any state, when the library has to try.
-bool ReadAtOnce(const PngReader& reader, const PngLayout& layout, const PictureRecord& picture, PngTarget& target) {
+// All rows, inflated at once, in `room` bytes of memory. False, with the target in any state, when the library has to try.
+bool ReadAtOnce(const PngReader& reader, const PngLayout& layout, const PictureRecord& picture, uint64_t room,
+                PngTarget& target) {
   const StoreFileRow store = FileRowStore(reader, layout);
   if (store == nullptr) return false;
   const uint32_t pixelBits = uint32_t{png_get_bit_depth(reader.png, reader.info)} * png_get_channels(reader.png, reader.info);
   const uint64_t rowBytes = (static_cast<uint64_t>(layout.width) * pixelBits + 7) / 8;
   PngPixels pixels;
-  if (!pixels.Inflate(reader.file, rowBytes, pixelBits, layout.height)) return false;
+  if (!pixels.Inflate(reader.file, rowBytes, pixelBits, layout.height, room)) return false;
   for (int32_t y = 0; y < layout.height; ++y) {
     const uint8_t* row = pixels.NextRow();
     if (row == nullptr) return false;
     store(row, static_cast<size_t>(layout.width), reader, target.image.Row(y).data(),
           target.alpha.Empty() ? nullptr : target.alpha.Row(y).data());
-    picture.ReportRow(y);
+    if (picture.ReportRow(y) != Status::Ok) return false;  // the library's way ends at once
   }
   return true;
 }
 
 Status ReadPixels(PngReader& reader, const PngLayout& layout, PictureRecord& picture) {
   PngTarget target;
+  const bool withAlpha = layout.rows == RowForm::WithAlpha;
+  const uint64_t pixels = static_cast<uint64_t>(layout.width) * static_cast<uint64_t>(layout.height);
+  const uint64_t held = PackedRowBytes(layout.width, layout.height, layout.bitsPerPixel) + (withAlpha ? pixels : 0);
+  RETURN_IF_BAD(CheckFileMemory(held + (!layout.interlaced ? 0 : withAlpha ? 4 * pixels : layout.rows == RowForm::TwoBits ? pixels : 0)));
   RETURN_IF_BAD(NewPackedImage(layout.width, layout.height, &picture.palette, layout.bitsPerPixel, target.image));
-  if (layout.rows == RowForm::WithAlpha) RETURN_IF_BAD(NewAlphaPlane(layout.width, layout.height, target.alpha));
-  if (!ReadAtOnce(reader, layout, picture, target)) {
+  if (withAlpha) RETURN_IF_BAD(NewAlphaPlane(layout.width, layout.height, target.alpha));
+  if (!ReadAtOnce(reader, layout, picture, limits.fileMemoryBytes - held, target)) {
     // Only now: the library takes memory for rows of whatever width the file claims.
     if (!PngGuarded(reader.png, [&] { SetConversions(reader, layout); })) return reader.Failure();
     RETURN_IF_BAD(layout.interlaced ? ReadInterlaced(reader, layout, picture, target)

@@ -211,7 +211,7 @@ void WriteChunk(ByteWriter& out, std::span<const uint8_t> head, std::span<const 
 }  // namespace
 
 Status WritePngPixels(const PngRows& rows, bool filtered, int32_t level, ByteWriter& out,
-                      const std::function<void(int32_t)>& report) {
+                      const std::function<Status(int32_t)>& report) {
   if (rows.rowBytes > limits.packedBlockBytes / 8) return Status::MemoryAllocationError;  // a band takes several rows' room
   const BandMaker maker(rows, filtered, level);
   const int32_t bands = maker.Bands();
@@ -228,7 +228,7 @@ Status WritePngPixels(const PngRows& rows, bool filtered, int32_t level, ByteWri
     WriteChunk(out, i == 0 ? std::span<const uint8_t>(kZlibHead) : none, band.deflated.Bytes().first(band.size),
                i == bands - 1 ? std::span<const uint8_t>(check) : none);
     if (out.Failed()) return Status::ErrorWritingFile;
-    for (int32_t y = i == 0 ? 0 : maker.EndOf(i - 1); y < maker.EndOf(i); ++y) report(y);
+    for (int32_t y = i == 0 ? 0 : maker.EndOf(i - 1); y < maker.EndOf(i); ++y) RETURN_IF_BAD(report(y));
   }
   return Status::Ok;
 }

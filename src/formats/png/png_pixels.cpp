@@ -53,7 +53,7 @@ bool Join(const std::vector<std::span<const uint8_t>>& parts, uint64_t size, pla
 
 }  // namespace
 
-bool PngPixels::Inflate(std::span<const uint8_t> file, uint64_t rowBytes, uint32_t pixelBits, int32_t height) {
+bool PngPixels::Inflate(std::span<const uint8_t> file, uint64_t rowBytes, uint32_t pixelBits, int32_t height, uint64_t room) {
   rowBytes_ = rowBytes;
   pixelBytes_ = std::max(1u, pixelBits / 8);
   const auto rows = static_cast<uint64_t>(height);
@@ -64,6 +64,7 @@ bool PngPixels::Inflate(std::span<const uint8_t> file, uint64_t rowBytes, uint32
   uint64_t packed = 0;
   constexpr uint64_t kBestRatio = 1032;  // of deflate
   if (!FindPixelChunks(file, parts, packed) || size / kBestRatio > packed) return false;
+  if (size + 2 * rowBytes > room || (parts.size() > 1 && packed > room - size - 2 * rowBytes)) return false;
   platform::MemoryBlock copy;
   std::span<const uint8_t> joined;
   const std::unique_ptr<libdeflate_decompressor, DecompressorDeleter> decompressor(libdeflate_alloc_decompressor());

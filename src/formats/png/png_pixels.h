@@ -11,8 +11,9 @@ namespace fotomill {
 class PngPixels {
  public:
   // Inflates the pixels of a file whose rows have `rowBytes` and whose pixels have `pixelBits`. False when that is not
-  // possible for whatever reason, damage included: another decoder must say why.
-  [[nodiscard]] bool Inflate(std::span<const uint8_t> file, uint64_t rowBytes, uint32_t pixelBits, int32_t height);
+  // possible for whatever reason, damage included, or takes more than `room` bytes: another decoder must try.
+  [[nodiscard]] bool Inflate(std::span<const uint8_t> file, uint64_t rowBytes, uint32_t pixelBits, int32_t height,
+                             uint64_t room);
   // The next row, from the top; null when its filter does not exist.
   const uint8_t* NextRow();
 

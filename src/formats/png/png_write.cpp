@@ -133,7 +133,7 @@ Status WritePixels(const PictureRecord& picture, int32_t compression, ByteWriter
   };
   const int type = ColorType(picture);  // palettes and pixels within a byte have no neighbours to differ from
   const bool filtered = type != PNG_COLOR_TYPE_PALETTE && DepthOf(picture) == 8;
-  return WritePngPixels(rows, filtered, compression, out, [&](int32_t y) { picture.ReportRow(y); });
+  return WritePngPixels(rows, filtered, compression, out, [&](int32_t y) { return picture.ReportRow(y); });
 }
 
 void WriteEnd(ByteWriter& out) {

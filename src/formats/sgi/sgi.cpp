@@ -151,7 +151,7 @@ Status ReadRows(const RowTable& table, const SgiHeader& header, const PictureRec
       MergeColors(header.Gray() ? red.data() : blue.data(), second, red.data(), width, row.data());
     }
     if (header.Alpha()) RETURN_IF_BAD(table.Decode(header.Gray() ? 1 : 3, y, alpha.StoredRow(y).first(width)));
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
   }
   return Status::Ok;
 }
@@ -223,7 +223,7 @@ Status WriteRows(ByteWriter& out, const PictureRecord& picture, uint16_t channel
     PutBe32(table, index, out.Position());
     PutBe32(table, rows + index, length);
     out.Bytes(std::span(code).first(length));
-    picture.ReportRow(static_cast<int32_t>(index / channels), height);
+    RETURN_IF_BAD(picture.ReportRow(static_cast<int32_t>(index / channels), height));
   }
   out.Patch(kHeaderSize, table);
   return Status::Ok;

@@ -245,7 +245,7 @@ Status RasRead(PictureRecord& picture, const ReadRequest& request) {
     if (row.empty()) return Status::FileReadError;
     put(row.data(), header.width, image.Row(y).data());
     file.DropBefore(header.PixelOffset() + source.Position());
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
   }
   if (!file.Intact()) return Status::FileReadError;
   picture.image = std::move(image);
@@ -265,7 +265,7 @@ Status RasWrite(PictureRecord& picture, const WriteOptions& options) {
   WriteHead(out, picture, layout, size);
   std::vector<uint8_t> bytes(rowSize);
   for (int32_t y = 0; y < image.Height() && !out.Failed(); ++y) {
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
     MakeRow(image, y, layout, bytes);
     out.Bytes(bytes);
   }

@@ -297,7 +297,7 @@ Status ReadRows(ByteReader& bytes, platform::FileView& file, const TgaHeader& he
       if (!opacity.empty()) MirrorRow(opacity, header.width, 1);
     }
     file.DropBefore(bytes.Position());
-    picture.ReportRow(r);
+    RETURN_IF_BAD(picture.ReportRow(r));
   }
   return file.Intact() ? Status::Ok : Status::FileReadError;
 }
@@ -434,7 +434,7 @@ Status TgaWrite(PictureRecord& picture, const WriteOptions& options) {
   WriteHeader(out, picture, layout);
   std::vector<uint8_t> row(static_cast<size_t>(image.Width()) * static_cast<size_t>(layout.bits / 8));
   for (int32_t r = 0; r < image.Height() && !out.Failed(); ++r) {
-    picture.ReportRow(r);
+    RETURN_IF_BAD(picture.ReportRow(r));
     WriteRow(picture, r, layout, row);
     out.Bytes(row);
   }

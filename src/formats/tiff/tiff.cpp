@@ -8,9 +8,10 @@
 //
 // What the reader makes of it: grays and palettes of 1, 2, 4 and 8 bits keep their depth (2 becomes 4), deeper grays become
 // 8 bits, everything else 24 bits, with an alpha plane where an extra sample says that it is alpha; colors that were
-// multiplied by it are divided again. CMYK is turned into RGB by the usual formula. YCbCr that is not JPEG, CIE L*a*b* and
-// LogLuv come through the library's own conversion. Orientation is not applied here: it travels in the EXIF block, which is
-// gathered from the directories of a camera. XMP, ICC profile, description and resolution travel with the picture as well.
+// multiplied by it are divided again. CMYK is turned into RGB by the usual formula. CIE L*a*b* is turned into sRGB by lcms2.
+// YCbCr that is not JPEG and LogLuv come through the library's own conversion. Orientation is not applied here: it travels in
+// the EXIF block, which is gathered from the directories of a camera. XMP, ICC profile, description and resolution travel
+// with the picture as well.
 //
 // A file that ends before its last pixel fails (status 3). A fault inside the data that the decoder passes over is told in
 // the record's `warning`.
@@ -21,13 +22,17 @@
 #include <bit>
 #include <cmath>
 #include <cstring>
+#include <optional>
 #include <string>
+#include <unordered_set>
 #include <vector>
 
 #include "containers/exif_directories.h"
+#include "core/byte_reader.h"
 #include "core/limits.h"
 #include "formats/png/png_filter.h"
 #include "formats/tiff/tiff_file.h"
+#include "formats/tiff/tiff_lab.h"
 #include "formats/tiff/tiff_lzw.h"
 #include "formats/tiff/tiff_samples.h"
 #include "picture/gray_palette.h"
@@ -39,7 +44,6 @@ namespace fotomill {
 namespace {
 
 constexpr double kCentimetresPerInch = 2.54;
-constexpr tdir_t kMostPages = 1 << 20;
 constexpr uint32_t kMostRowSamples = 1 << 25;  // a row is held as a whole
 
 // How the rows of a page become the picture's.
@@ -91,6 +95,8 @@ uint16_t ColorsOf(TIFF* tiff, const TiffLayout& layout) {
     case PHOTOMETRIC_RGB: return 3;
     case PHOTOMETRIC_YCBCR: return layout.compression == COMPRESSION_JPEG ? 3 : 0;
     case PHOTOMETRIC_SEPARATED: return Field<uint16_t>(tiff, TIFFTAG_INKSET) == INKSET_CMYK ? 4 : 0;
+    case PHOTOMETRIC_CIELAB:
+    case PHOTOMETRIC_ICCLAB: return layout.samples >= 3 && (layout.form.bits == 8 || layout.form.bits == 16) ? 3 : 0;
     case PHOTOMETRIC_MINISBLACK:
     case PHOTOMETRIC_MINISWHITE:
     case PHOTOMETRIC_PALETTE: return 1;
@@ -223,13 +229,46 @@ bool HoldsFurtherTags(TIFF* tiff) {
   return false;
 }
 
+// Where the directories of the pages are, as many as lie in the file, up to the limit. A second visit ends the chain; a look at
+// those visited is only needed where it goes back.
+std::vector<uint64_t> PageOffsets(const TiffInput& input) {
+  const bool big = TIFFIsBigTIFF(input.Handle()) != 0;
+  const bool bigEndian = TIFFIsBigEndian(input.Handle()) != 0;
+  ByteReader bytes(input.Bytes());
+  const auto number = [&](int size) -> uint64_t {
+    if (size == 2) return bigEndian ? bytes.Be16() : bytes.Le16();
+    const uint64_t first = bigEndian ? bytes.Be32() : bytes.Le32();
+    if (size == 4) return first;
+    return bigEndian ? first << 32 | bytes.Be32() : first | uint64_t{bytes.Le32()} << 32;
+  };
+  std::vector<uint64_t> offsets;
+  std::unordered_set<uint64_t> visited;
+  uint64_t furthest = 0;
+  bytes.Seek(big ? 8 : 4);
+  for (uint64_t next = number(big ? 8 : 4); next != 0 && offsets.size() < limits.filePages;) {
+    bytes.Seek(next);
+    const uint64_t entries = number(big ? 8 : 2);
+    const uint64_t entrySize = big ? 20 : 12;
+    if (!bytes.Ok() || entries == 0 || entries > bytes.Left() / entrySize) break;
+    if (next <= furthest && visited.empty()) visited.insert(offsets.begin(), offsets.end());
+    if ((next <= furthest || !visited.empty()) && !visited.insert(next).second) break;
+    furthest = std::max(furthest, next);
+    offsets.push_back(next);
+    bytes.Skip(entries * entrySize);
+    next = number(big ? 8 : 4);
+    if (!bytes.Ok()) break;
+  }
+  return offsets;
+}
+
 // Opens a page and fills the facts.
 Status Describe(TiffInput& input, int32_t page, TiffLayout& layout, PictureRecord& picture) {
   RETURN_IF_BAD(input.Open());
   TIFF* tiff = input.Handle();
-  const tdir_t pages = std::clamp<tdir_t>(TIFFNumberOfDirectories(tiff), 1, kMostPages);
-  if (page < 0 || static_cast<tdir_t>(page) >= pages) return Status::NoImages;
-  if (TIFFSetDirectory(tiff, static_cast<tdir_t>(page)) == 0) return input.Failure();
+  const std::vector<uint64_t> offsets = PageOffsets(input);
+  const size_t pages = std::max<size_t>(offsets.size(), 1);
+  if (page < 0 || static_cast<size_t>(page) >= pages) return Status::NoImages;
+  if (page > 0 && TIFFSetSubDirectory(tiff, offsets[static_cast<size_t>(page)]) == 0) return input.Failure();
   RETURN_IF_BAD(ReadLayout(tiff, layout));
   picture.pageCount = static_cast<int32_t>(pages);
   picture.typeName.AssignCut(TIFFIsBigTIFF(tiff) != 0 ? "BigTIFF" : "TIFF");
@@ -253,11 +292,17 @@ uint8_t Divided(uint32_t value, uint32_t alpha) {
   return alpha == 0 ? 0 : static_cast<uint8_t>(std::min(255u, (value * 255 + alpha / 2) / alpha));
 }
 
+bool IsLab(const TiffLayout& layout) {
+  return layout.photometric == PHOTOMETRIC_CIELAB || layout.photometric == PHOTOMETRIC_ICCLAB;
+}
+
 // Turns decoded rows into the picture's.
 class TiffConverter {
  public:
   TiffConverter(const TiffLayout& layout, const Palette& palette, TiffTarget& target)
-      : layout_(layout), palette_(palette), target_(target), bytes_(size_t{layout.samples} * layout.width) {}
+      : layout_(layout), palette_(palette), target_(target), bytes_(size_t{layout.samples} * layout.width) {
+    if (IsLab(layout)) lab_.emplace(layout.photometric == PHOTOMETRIC_CIELAB);
+  }
 
   // `row` holds all samples, or the first one's row with those of the others `planeStride` bytes apart.
   void Store(int32_t y, const uint8_t* row, size_t planeStride) {
@@ -296,9 +341,11 @@ class TiffConverter {
     return bytes_.data();
   }
 
-  void StoreColors(const uint8_t* samples, uint8_t* image) const {
+  void StoreColors(const uint8_t* samples, uint8_t* image) {
     const size_t width = layout_.width, step = layout_.samples;
-    if (layout_.colors == 3 && step == 3) {
+    if (lab_) {
+      lab_->StoreRow(samples, step, width, image);
+    } else if (layout_.colors == 3 && step == 3) {
       SwapColors(samples, width, image);
     } else if (layout_.colors == 3) {
       for (size_t x = 0; x < width; ++x, samples += step, image += 3) {
@@ -337,6 +384,7 @@ class TiffConverter {
   const Palette& palette_;
   TiffTarget& target_;
   std::vector<uint8_t> bytes_;  // one row's samples
+  std::optional<TiffLab> lab_;
 };
 
 // Whether rows can be taken from the strips without the library: whole bytes or less a sample, in the usual bit order.
@@ -374,7 +422,7 @@ bool ReadPlainStrips(TiffInput& input, const TiffLayout& layout, const PictureRe
       }
       const auto y = static_cast<int32_t>(top + r);
       converter.Store(y, packed ? decoded + place : data.data() + place, 0);
-      picture.ReportRow(y);
+      if (picture.ReportRow(y) != Status::Ok) return false;  // the library's way ends at once
     }
   }
   return true;
@@ -389,7 +437,7 @@ Status ReadScanlines(TiffInput& input, const TiffLayout& layout, const PictureRe
   for (uint32_t y = 0; y < layout.height; ++y) {
     if (TIFFReadScanline(tiff, row.data(), y, 0) < 0) return input.Failure();
     converter.Store(static_cast<int32_t>(y), row.data(), 0);
-    picture.ReportRow(static_cast<int32_t>(y));
+    RETURN_IF_BAD(picture.ReportRow(static_cast<int32_t>(y)));
   }
   return Status::Ok;
 }
@@ -403,7 +451,8 @@ class TiffBand {
     rowBytes_ = (layout.width * bitsPerPixel_ + 7) / 8;
     rows_ = std::min(layout.bandHeight, layout.height);
   }
-  Status Allocate() {
+  // `held`: what the picture itself takes.
+  Status Allocate(uint64_t held) {
     const uint64_t planeBytes = rowBytes_ * rows_;
     if (planeBytes > limits.packedBlockBytes / planes_) return Status::MemoryAllocationError;
     TIFF* tiff = input_.Handle();
@@ -411,6 +460,7 @@ class TiffBand {
     pieceBytes_ = layout_.tiled ? TIFFTileSize64(tiff) : pieceRow_ * rows_;
     if (pieceRow_ == 0 || pieceBytes_ == 0) return Status::DamagedFile;
     if (pieceBytes_ > limits.packedBlockBytes) return Status::MemoryAllocationError;
+    RETURN_IF_BAD(CheckFileMemory(held + planeBytes * planes_ + pieceBytes_));
     if (layout_.tiled && layout_.tileWidth < layout_.width && layout_.tileWidth * bitsPerPixel_ % 8 != 0) {
       return Status::UnsupportedFormat;
     }
@@ -453,14 +503,15 @@ class TiffBand {
   platform::MemoryBlock bytes_, piece_;
 };
 
-Status ReadBands(TiffInput& input, const TiffLayout& layout, const PictureRecord& picture, TiffConverter& converter) {
+Status ReadBands(TiffInput& input, const TiffLayout& layout, const PictureRecord& picture, uint64_t held,
+                 TiffConverter& converter) {
   TiffBand band(input, layout);
-  RETURN_IF_BAD(band.Allocate());
+  RETURN_IF_BAD(band.Allocate(held));
   for (uint32_t top = 0; top < layout.height; top += std::min(band.Rows(), layout.height - top)) {
     RETURN_IF_BAD(band.Fill(top));
     for (uint32_t r = 0; r < band.Rows() && top + r < layout.height; ++r) {
       converter.Store(static_cast<int32_t>(top + r), band.Row(r), band.PlaneStride());
-      picture.ReportRow(static_cast<int32_t>(top + r));
+      RETURN_IF_BAD(picture.ReportRow(static_cast<int32_t>(top + r)));
     }
   }
   return Status::Ok;
@@ -469,7 +520,6 @@ Status ReadBands(TiffInput& input, const TiffLayout& layout, const PictureRecord
 // What only the library can convert comes as one raster of red, green, blue and alpha, colors multiplied by alpha.
 Status ReadThroughLibrary(TiffInput& input, const TiffLayout& layout, PictureRecord& picture, TiffTarget& target) {
   const uint64_t pixels = uint64_t{layout.width} * layout.height;
-  if (pixels > limits.packedBlockBytes / 4) return Status::MemoryAllocationError;
   char why[1024] = {};
   TIFFRGBAImage image;
   if (TIFFRGBAImageOK(input.Handle(), why) == 0) return Status::UnsupportedFormat;
@@ -489,7 +539,7 @@ Status ReadThroughLibrary(TiffInput& input, const TiffLayout& layout, PictureRec
       row[1] = static_cast<uint8_t>(TIFFGetG(*source));
       row[2] = static_cast<uint8_t>(TIFFGetR(*source));
     }
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
   }
   return Status::Ok;
 }
@@ -498,6 +548,9 @@ Status ReadPixels(TiffInput& input, const TiffLayout& layout, PictureRecord& pic
   if (!FileHoldsPixels(input, layout)) return Status::FileReadError;
   if (layout.width > kMostRowSamples / layout.samples) return Status::MemoryAllocationError;
   TiffTarget target;
+  const uint64_t pixels = uint64_t{layout.width} * layout.height;
+  const uint64_t held = PackedRowBytes(picture.width, picture.height, layout.bitsPerPixel) + (layout.alpha >= 0 ? pixels : 0);
+  RETURN_IF_BAD(CheckFileMemory(held + (layout.rows == TiffRows::Library ? 4 * pixels : uint64_t{layout.samples} * layout.width)));
   RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette, layout.bitsPerPixel, target.image));
   if (layout.alpha >= 0) RETURN_IF_BAD(NewAlphaPlane(picture.width, picture.height, target.alpha));
   input.Messages().inPixels = true;
@@ -507,7 +560,7 @@ Status ReadPixels(TiffInput& input, const TiffLayout& layout, PictureRecord& pic
     TiffConverter converter(layout, picture.palette, target);
     const bool done = ReadPlainStrips(input, layout, picture, converter);
     if (!done)
-      RETURN_IF_BAD(layout.tiled || layout.separate ? ReadBands(input, layout, picture, converter)
+      RETURN_IF_BAD(layout.tiled || layout.separate ? ReadBands(input, layout, picture, held, converter)
                                                     : ReadScanlines(input, layout, picture, converter));
   }
   picture.image = std::move(target.image);
@@ -562,6 +615,7 @@ Status TiffRead(PictureRecord& picture, const ReadRequest& request) {
   picture.image.Free();
   picture.alpha.Free();
   picture.warning.Clear();
+  picture.note.Clear();
   platform::FileView file;
   if (!file.Open(request.fileName)) return Status::FileOpenError;
   TiffInput input(file.Bytes());
@@ -571,7 +625,8 @@ Status TiffRead(PictureRecord& picture, const ReadRequest& request) {
   const Status status = ReadPixels(input, layout, picture);
   if (status == Status::Ok && file.Intact()) {
     const TiffMessages& messages = input.Messages();
-    picture.warning.AssignCut(messages.error[0] != 0 ? messages.error : messages.warning);
+    picture.warning.AssignCut(messages.error);
+    picture.note.AssignCut(messages.warning);
     return Status::Ok;
   }
   picture.image.Free();

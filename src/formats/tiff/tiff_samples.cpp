@@ -80,7 +80,8 @@ void ConvertSamples(const uint8_t* source, const TiffSampleForm& form, bool scal
     return;
   }
   const uint64_t most = (uint64_t{1} << form.bits) - 1;
-  const auto sign = static_cast<uint32_t>(form.kind == TiffSampleForm::Signed ? uint64_t{1} << (form.bits - 1) : 0);
+  // Signed samples are moved to where the lowest is black. Bytes are not: what writes them means values from 0 to 255.
+  const auto sign = static_cast<uint32_t>(form.kind == TiffSampleForm::Signed && form.bits != 8 ? uint64_t{1} << (form.bits - 1) : 0);
   for (size_t i = 0; i < count; ++i) {
     const uint32_t value = LoadInteger(source, i, form.bits) ^ sign;
     target[i * step] = static_cast<uint8_t>(scaled ? (uint64_t{value} * 255 + most / 2) / most : value);

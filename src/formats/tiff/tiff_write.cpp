@@ -206,7 +206,7 @@ Status WriteScanlines(TIFF* tiff, const PictureRecord& picture, const TiffPlan& 
   for (int32_t y = 0; y < picture.image.Height(); ++y) {
     MakeRow(picture, plan, y, row);
     if (TIFFWriteScanline(tiff, row.data(), static_cast<uint32_t>(y), 0) < 0) return Status::ErrorWritingFile;
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
   }
   return Status::Ok;
 }
@@ -226,7 +226,7 @@ Status WriteLzwStrips(TIFF* tiff, const PictureRecord& picture, const TiffPlan& 
       const size_t plain = plan.predict ? plan.samples : rowBytes;
       std::copy_n(row.begin(), plain, target);
       for (size_t i = plain; i < rowBytes; ++i) target[i] = static_cast<uint8_t>(row[i] - row[i - plain]);
-      picture.ReportRow(static_cast<int32_t>(top + r));
+      RETURN_IF_BAD(picture.ReportRow(static_cast<int32_t>(top + r)));
     }
     encoder.Encode(std::span(strip).first(rows * rowBytes), coded);
     if (TIFFWriteRawStrip(tiff, index, coded.data(), static_cast<tmsize_t>(coded.size())) < 0) return Status::ErrorWritingFile;

@@ -102,7 +102,7 @@ Status WbmpRead(PictureRecord& picture, const ReadRequest& request) {
   for (int32_t y = 0; y < header.height; ++y) {
     std::ranges::copy(bytes.Take(header.RowSize()), image.Row(y).begin());
     file.DropBefore(bytes.Position());
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
   }
   if (!file.Intact()) return Status::FileReadError;
   picture.image = std::move(image);
@@ -123,7 +123,7 @@ Status WbmpWrite(PictureRecord& picture, const WriteOptions& options) {
   std::vector<uint8_t> bytes((static_cast<size_t>(image.Width()) + 7) / 8);
   const uint8_t invert = IsDarkFirst(picture.palette) ? 0 : 0xff;
   for (int32_t y = 0; y < image.Height() && !out.Failed(); ++y) {
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
     for (size_t i = 0; i < bytes.size(); ++i) bytes[i] = image.Row(y)[i] ^ invert;
     out.Bytes(bytes);
   }

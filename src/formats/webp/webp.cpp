@@ -179,9 +179,20 @@ void ClearFrame(const WebpFrame& frame, Canvas& target) {
   }
 }
 
+// Bytes that the library holds while it decodes a frame: lossless pixels and alpha as a whole, others row by row.
+uint64_t DecoderBytes(const WebpFrame& frame) {
+  WebPBitstreamFeatures features;
+  if (WebPGetFeatures(frame.pixels.data(), frame.pixels.size(), &features) != VP8_STATUS_OK) return 0;
+  const uint64_t pixels = static_cast<uint64_t>(features.width) * static_cast<uint64_t>(features.height);
+  if (features.format == kLossless) return 4 * pixels;
+  return features.has_alpha != 0 ? 5 * pixels : 0;
+}
+
 // With alpha, a frame is decoded to four bytes a pixel and put in its place.
 Status ReadFrame(const WebpFrame& frame, Canvas& target) {
   const size_t stride = 4 * static_cast<size_t>(frame.width);
+  RETURN_IF_BAD(CheckFileMemory(target.image.Bytes().size() + target.alpha.Bytes().size() + stride * static_cast<size_t>(frame.height) +
+                                DecoderBytes(frame)));
   platform::MemoryBlock decoded;
   if (!decoded.Allocate(stride * static_cast<size_t>(frame.height), platform::Fill::Unset)) return Status::MemoryAllocationError;
   WebPDecoderConfig config;
@@ -210,7 +221,7 @@ Status DrawFrame(WebpFile& file, size_t index, Canvas& target) {
 Status ReadWithAlpha(WebpFile& file, int32_t frames, const PictureRecord& picture, Canvas& target) {
   for (int32_t i = 0; i < frames; ++i) {
     RETURN_IF_BAD(DrawFrame(file, static_cast<size_t>(i), target));
-    picture.ReportRow(i, frames);
+    RETURN_IF_BAD(picture.ReportRow(i, frames));
   }
   return Status::Ok;
 }
@@ -226,6 +237,7 @@ void DropOpaqueAlpha(Canvas& target) {
 
 // Without alpha the library fills the picture's own rows, which are stored bottom row first.
 Status ReadOpaque(const WebpFile& file, const PictureRecord& picture, Canvas& target) {
+  RETURN_IF_BAD(CheckFileMemory(target.image.Bytes().size() + DecoderBytes(file.frames[0])));
   WebPDecoderConfig config;
   if (WebPInitDecoderConfig(&config) == 0) return Status::MemoryAllocationError;
   config.output.colorspace = MODE_BGR;
@@ -233,7 +245,7 @@ Status ReadOpaque(const WebpFile& file, const PictureRecord& picture, Canvas& ta
   config.options.flip = 1;
   config.output.u.RGBA = {target.image.Rows().data(), static_cast<int>(target.image.Stride()), target.image.Rows().size()};
   RETURN_IF_BAD(StatusOf(WebPDecode(file.frames[0].pixels.data(), file.frames[0].pixels.size(), &config)));
-  for (int32_t y = 0; y < file.height; ++y) picture.ReportRow(y);
+  for (int32_t y = 0; y < file.height; ++y) RETURN_IF_BAD(picture.ReportRow(y));
   return Status::Ok;
 }
 
@@ -275,6 +287,18 @@ void FillRow(const PictureRecord& picture, int32_t y, uint32_t* target) {
   }
 }
 
+// What the encoder holds for a pixel, at most: measured on noise, which takes the most.
+constexpr uint64_t kLosslessBytes = 32, kLossyBytes = 17, kLossyLeastBytes = 8;
+
+// Refuses what takes too much memory. Lossy encoding has a way that takes longer and less.
+Status ChooseMemory(const PictureRecord& picture, WebPConfig& config) {
+  const uint64_t pixels = static_cast<uint64_t>(picture.image.Width()) * static_cast<uint64_t>(picture.image.Height());
+  const uint64_t held = picture.image.Bytes().size() + picture.alpha.Bytes().size();
+  if (config.lossless != 0) return CheckFileMemory(held + kLosslessBytes * pixels);
+  config.low_memory = CheckFileMemory(held + kLossyBytes * pixels) == Status::Ok ? 0 : 1;
+  return CheckFileMemory(held + kLossyLeastBytes * pixels);
+}
+
 Status Encode(const PictureRecord& picture, bool lossless, int32_t factor, WebPMemoryWriter& encoded) {
   WebPConfig config;
   WebPPicture source;
@@ -282,18 +306,24 @@ Status Encode(const PictureRecord& picture, bool lossless, int32_t factor, WebPM
   if (WebPConfigPreset(&config, WEBP_PRESET_DEFAULT, quality) == 0 || WebPPictureInit(&source) == 0) return Status::ResourceError;
   config.lossless = lossless ? 1 : 0;
   config.exact = lossless ? 1 : 0;
+  RETURN_IF_BAD(ChooseMemory(picture, config));
   source.use_argb = 1;
   source.width = picture.image.Width();
   source.height = picture.image.Height();
   source.writer = WebPMemoryWrite;
   source.custom_ptr = &encoded;
+  source.user_data = const_cast<PictureRecord*>(&picture);
+  source.progress_hook = [](int, const WebPPicture* asked) {
+    return static_cast<const PictureRecord*>(asked->user_data)->stop.Asked() ? 0 : 1;
+  };
   if (WebPPictureAlloc(&source) == 0) return Status::MemoryAllocationError;
   const std::unique_ptr<WebPPicture, PictureDeleter> owner(&source);
   for (int32_t y = 0; y < source.height; ++y) {
     FillRow(picture, y, source.argb + static_cast<ptrdiff_t>(source.argb_stride) * y);
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
   }
   if (WebPEncode(&config, &source) != 0) return Status::Ok;
+  if (source.error_code == VP8_ENC_ERROR_USER_ABORT) return Status::FunctionCancelled;
   const bool memory =
       source.error_code == VP8_ENC_ERROR_OUT_OF_MEMORY || source.error_code == VP8_ENC_ERROR_BITSTREAM_OUT_OF_MEMORY;
   return memory ? Status::MemoryAllocationError : Status::ErrorWritingFile;
@@ -367,6 +397,8 @@ Status WebpRead(PictureRecord& picture, const ReadRequest& request) {
   if (request.page < 0 || request.page >= picture.pageCount) return Status::NoImages;
   const bool canvas = file.alpha || file.frames.size() > 1;
   Canvas target;
+  const uint64_t rows = PackedRowBytes(file.width, file.height, 24);  // zeroed pages count only once the frame is drawn
+  RETURN_IF_BAD(CheckFileMemory(canvas ? rows + rows / 3 : rows));
   RETURN_IF_BAD(NewPackedImage(file.width, file.height, &picture.palette, 24, target.image));
   if (canvas) RETURN_IF_BAD(NewAlphaPlane(file.width, file.height, target.alpha));
   RETURN_IF_BAD(canvas ? ReadWithAlpha(file, request.page + 1, picture, target) : ReadOpaque(file, picture, target));
@@ -394,7 +426,10 @@ Status WebpWrite(PictureRecord& picture, const WriteOptions& options) {
   EncodedFile encoded, other;
   const int32_t quality = options.encode.webpQuality;
   RETURN_IF_BAD(Encode(picture, lossless, quality, encoded.writer));
-  if (!options.lossless && options.encode.webpMixed) RETURN_IF_BAD(Encode(picture, !lossless, quality, other.writer));
+  if (!options.lossless && options.encode.webpMixed) {
+    const Status status = Encode(picture, !lossless, quality, other.writer);
+    if (status != Status::Ok && status != Status::MemoryAllocationError) return status;
+  }
   const bool useOther = other.writer.size > 0 && other.writer.size < encoded.writer.size;
   const WebPMemoryWriter& chosen = useOther ? other.writer : encoded.writer;
   const std::span<const uint8_t> bytes(chosen.mem, chosen.size);

@@ -257,7 +257,7 @@ Status XbmRead(PictureRecord& picture, const ReadRequest& request) {
   for (int32_t y = 0; y < picture.height; ++y) {
     if (!DecodeRow(text, static_cast<size_t>(picture.width), image.Row(y))) return Status::DamagedFile;
     file.DropBefore(text.Position());
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
   }
   if (!file.Intact()) return Status::DamagedFile;
   picture.image = std::move(image);
@@ -281,7 +281,7 @@ Status XbmWrite(PictureRecord& picture, const WriteOptions& options) {
   WriteLine(out, "static char " + name + "_text_bits[] = {");
   XbmValueWriter writer(out, uint64_t{rowValues} * static_cast<uint64_t>(image.Height()));
   for (int32_t y = 0; y < image.Height() && !out.Failed(); ++y) {
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
     EncodeRow(image.Row(y), static_cast<size_t>(image.Width()), values.Bytes());
     writer.Write(values.Bytes());
   }

@@ -173,7 +173,7 @@ struct Reduction {
   // FunctionCancelled when the work was stopped.
   Status StoreRow(int32_t y) {
     PackIndices(indices.Data(), Width(), bits, made.Row(y).data());
-    picture.ReportRow(y + 1);
+    RETURN_IF_BAD(picture.ReportRow(y + 1));
     return work != nullptr && y % kRowsUnasked == 0 && !work->GoesOn() ? Status::FunctionCancelled : Status::Ok;
   }
   Status OpenRows() {
