@@ -137,7 +137,7 @@ Status DrawLayer(const PspFile& psp, const PspLayer& layer, const PictureRecord&
   const int64_t end = std::min<int64_t>(place.width, int64_t{psp.width} - place.x);
   for (int32_t i = 0; i < place.height; ++i) {
     const int64_t y = int64_t{place.y} + i;
-    picture.ReportRow(i, place.height);
+    RETURN_IF_BAD(picture.ReportRow(i, place.height));
     if (y < 0 || y >= psp.height || first >= end) continue;
     rows.Read(i);
     uint8_t* const row = image.Row(static_cast<int32_t>(y)).data();
@@ -163,7 +163,7 @@ Status ReadIndexed(const PspLayer& layer, const PictureRecord& picture, PackedIm
     for (size_t x = 0; x < samples.size(); ++x) {
       row[x / perByte] = static_cast<uint8_t>(row[x / perByte] | samples[x] << (8 - bits * (x % perByte + 1)));
     }
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
   }
   return Status::Ok;
 }
@@ -306,7 +306,7 @@ Status WriteChannel(ByteWriter& out, const PictureRecord& picture, size_t channe
   for (int32_t y = 0; y < image.Height() && !out.Failed(); ++y) {
     GatherRow(image, channel, y, row);
     if (!writer.Write(row, y + 1 == image.Height())) return Status::MemoryAllocationError;
-    picture.ReportRow(y);
+    RETURN_IF_BAD(picture.ReportRow(y));
   }
   const uint64_t size = out.Position() - begin;
   if (out.Position() > UINT32_MAX) return Status::UnsuitableImage;
