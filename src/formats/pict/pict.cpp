@@ -131,6 +131,8 @@ Status ReadJpeg(std::span<const uint8_t> file, Draw draw) {
   jpeg_decompress_struct& info = reader.info;
   if (info.num_components != 1 && info.num_components != 3) return Status::UnsupportedFormat;
   if (info.image_width > INT16_MAX || info.image_height > INT16_MAX) return Status::DamagedFile;
+  const uint64_t pixels = PackedRowBytes(static_cast<int32_t>(info.image_width), static_cast<int32_t>(info.image_height), 24);
+  RETURN_IF_BAD(CheckFileMemory(JpegCoefficientBytes(reader, false) + pixels));
   std::vector<uint8_t> row(size_t{3} * info.image_width);
   const bool read = Guarded(reader.errors, [&] {
     info.out_color_space = JCS_EXT_BGR;
