@@ -121,7 +121,10 @@ void TakeLayer(const BlockView& block, PspFile& psp) {
   bytes.Skip(psp.version < 4 ? 256 : bytes.Le16());
   bytes.Skip(1);
   const Rectangle image = TakeRectangle(bytes);
-  PspLayer layer{.place = TakeRectangle(bytes), .bits = psp.bits, .compression = psp.compression};
+  PspLayer layer;
+  layer.place = TakeRectangle(bytes);
+  layer.bits = psp.bits;
+  layer.compression = psp.compression;
   layer.opacity = bytes.U8();
   layer.blendMode = bytes.U8();
   layer.visible = (bytes.U8() & 1) != 0;
