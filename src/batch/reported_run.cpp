@@ -10,10 +10,10 @@
 
 namespace fotomill {
 
-ReportedRun::ReportedRun(std::span<const BatchFile> files, BatchJob& job, Way way)
+ReportedRun::ReportedRun(std::span<const BatchFile> files, BatchJob& job, Task task)
     : files_(files),
       job_(job),
-      way_(std::move(way)),
+      task_(std::move(task)),
       stop_(job.stop.Token()),
       outcomes_(files.size()),
       run_({.work = [this](size_t file) { return Work(file); },
@@ -25,7 +25,7 @@ uint32_t ReportedRun::CoreJobs() { return platform::CoreCount(); }
 
 Status ReportedRun::Work(size_t file) {
   const FolderScope folder(files_[file].name);
-  outcomes_[file] = way_.process(file);
+  outcomes_[file] = task_.process(file);
   return Status::Ok;
 }
 
@@ -36,7 +36,7 @@ void ReportedRun::Deliver(size_t file, Status status) {
   if (stop_.Asked()) std::erase_if(outcomes, [](const FileOutcome& outcome) { return outcome.status == Status::FunctionCancelled; });
   if (outcomes.empty()) return;
   job_.source.AssignCut(outcomes[0].source);
-  const auto isWritten = [&](const FileOutcome& outcome) { return !outcome.destination.empty() && !outcome.skipped && !way_.dryRun; };
+  const auto isWritten = [&](const FileOutcome& outcome) { return !outcome.destination.empty() && !outcome.skipped && !task_.dryRun; };
   if (std::ranges::any_of(outcomes, isWritten)) {
     NoteUse(outcomes[0].source);
     job_.filesChanged = true;
@@ -57,9 +57,9 @@ void ReportedRun::Tick() {
 }
 
 void ReportedRun::NoteUse(const std::string& source) {
-  if ((job_.historyFunctions >> static_cast<uint32_t>(way_.history) & 1) == 0) return;
+  if ((job_.historyFunctions >> static_cast<uint32_t>(task_.history) & 1) == 0) return;
   const auto now = static_cast<int32_t>(platform::Now());
-  job_.uses.push_back({platform::AbsolutePath(source), way_.history, kOwnTime, now, false});
+  job_.uses.push_back({platform::AbsolutePath(source), task_.history, kOwnTime, now, false});
 }
 
 }  // namespace fotomill

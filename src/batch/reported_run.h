@@ -15,19 +15,19 @@
 
 namespace fotomill {
 
-// The way of every batch over files: each is worked on, on some thread, into an outcome; outcomes are reported on the calling
+// How every batch over files runs: each is worked on, on some thread, into an outcome; outcomes are reported on the calling
 // thread in the order of the selection, to the job's box, and what was written goes into the file history.
 class ReportedRun {
  public:
   // What is done with each file, and how it is recorded.
-  struct Way {
+  struct Task {
     // On any thread: an outcome for each output of the file. None for a file that was given up by Abort.
     std::function<std::vector<FileOutcome>(size_t file)> process;
     FileFunction history = FileFunction::Convert;
     bool dryRun = false;
   };
 
-  ReportedRun(std::span<const BatchFile> files, BatchJob& job, Way way);
+  ReportedRun(std::span<const BatchFile> files, BatchJob& job, Task task);
 
   // At most `jobs` files at a time; 0: one per core.
   void Run(uint32_t jobs) { run_.Run(files_.size(), jobs == 0 ? CoreJobs() : jobs); }
@@ -44,7 +44,7 @@ class ReportedRun {
 
   const std::span<const BatchFile> files_;
   BatchJob& job_;
-  const Way way_;
+  const Task task_;
   const StopToken stop_;
   std::vector<std::vector<FileOutcome>> outcomes_;  // of files that are done and not yet reported; none: given up
   std::atomic<bool> ended_{false};

@@ -92,19 +92,19 @@ class Turning {
     if (!file.Open(source_)) return Fail(Status::FileOpenError, ReasonSentence());
     std::vector<uint8_t> made;
     JpegTurnResult turned;
-    const JpegTurnWish wish{
+    const JpegTurnRequest request{
         .turn = request_.turn, .seenByExif = request_.seenByExif, .trim = request_.trim, .encode = options_.encode};
-    if (const Status status = MakeTurnedJpeg(file.Bytes(), wish, made, turned); status != Status::Ok) {
+    if (const Status status = MakeTurnedJpeg(file.Bytes(), request, made, turned); status != Status::Ok) {
       return Fail(status, turned.obstacle.shown);
     }
     if (!file.Intact()) return Status::FileReadError;
-    if (turned.way == JpegTurnWay::Trimmed) result_.note = TrRecorded("An edge was cropped.");
+    if (turned.method == JpegTurnMethod::Trimmed) result_.note = TrRecorded("An edge was cropped.");
     if (!turned.obstacle.empty()) {
-      const bool tag = turned.way == JpegTurnWay::Tag;
+      const bool tag = turned.method == JpegTurnMethod::Tag;
       result_.note = tag ? TrRecorded("Only the EXIF orientation was changed.") : TrRecorded("Left unchanged.");
       result_.note.Append(turned.obstacle);
     }
-    return WriteUnlessThere(turned.way == JpegTurnWay::Nothing ? file.Bytes() : made, turned.way == JpegTurnWay::Nothing);
+    return WriteUnlessThere(turned.method == JpegTurnMethod::Nothing ? file.Bytes() : made, turned.method == JpegTurnMethod::Nothing);
   }
 
   // The old and the turned picture are there at a time, as are the turned one and what is read back.

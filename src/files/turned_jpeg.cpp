@@ -42,23 +42,23 @@ void TurnExif(std::vector<uint8_t>& exif, Orientation orientation, const TurnedJ
 // A JPEG file in the making.
 class TurnedFile {
  public:
-  TurnedFile(std::span<const uint8_t> file, const JpegTurnWish& wish) : file_(file), wish_(wish) {}
+  TurnedFile(std::span<const uint8_t> file, const JpegTurnRequest& request) : file_(file), request_(request) {}
 
   Status Make(std::vector<uint8_t>& made, JpegTurnResult& result) {
     RETURN_IF_BAD(ParseJpegHead(file_, head_));
     exif_.assign(head_.Exif().begin(), head_.Exif().end());
     xmp_.assign(head_.Xmp().begin(), head_.Xmp().end());
     const auto told = static_cast<Orientation>(ExifOrientation(exif_));
-    const Orientation wanted = Composed(wish_.seenByExif ? told : Orientation::Upright, wish_.turn);
+    const Orientation wanted = Composed(request_.seenByExif ? told : Orientation::Upright, request_.turn);
     TurnedJpeg turned;
     if (wanted != Orientation::Upright) RETURN_IF_BAD(TurnPixels(wanted, turned));
     result.obstacle = turned.obstacle;
     if (!turned.file.empty()) {
-      result.way = turned.trimmed ? JpegTurnWay::Trimmed : JpegTurnWay::Pixels;
+      result.method = turned.trimmed ? JpegTurnMethod::Trimmed : JpegTurnMethod::Pixels;
       return WithPixels(wanted, turned, made);
     }
     if (wanted == told) return Status::Ok;
-    result.way = JpegTurnWay::Tag;
+    result.method = JpegTurnMethod::Tag;
     return WithOrientation(wanted, made);
   }
 
@@ -69,13 +69,13 @@ class TurnedFile {
     } else if (head_.HasSplitExif()) {
       turned.obstacle = TrRecorded("The EXIF block is too large for one segment.");
     } else {
-      return TurnJpeg(file_, wanted, wish_.trim, turned);
+      return TurnJpeg(file_, wanted, request_.trim, turned);
     }
     return Status::Ok;
   }
 
   Status WithPixels(Orientation wanted, const TurnedJpeg& turned, std::vector<uint8_t>& made) {
-    TurnExif(exif_, wanted, turned, wish_.encode);
+    TurnExif(exif_, wanted, turned, request_.encode);
     SetXmpOrientation(xmp_, 1);
     return AssembleJpeg(
         file_, head_,
@@ -91,18 +91,18 @@ class TurnedFile {
   }
 
   const std::span<const uint8_t> file_;
-  const JpegTurnWish& wish_;
+  const JpegTurnRequest& request_;
   JpegHead head_;
   std::vector<uint8_t> exif_, xmp_;
 };
 
 }  // namespace
 
-Status MakeTurnedJpeg(std::span<const uint8_t> file, const JpegTurnWish& wish, std::vector<uint8_t>& made,
+Status MakeTurnedJpeg(std::span<const uint8_t> file, const JpegTurnRequest& request, std::vector<uint8_t>& made,
                       JpegTurnResult& result) {
   made.clear();
   result = {};
-  return TurnedFile(file, wish).Make(made, result);
+  return TurnedFile(file, request).Make(made, result);
 }
 
 }  // namespace fotomill

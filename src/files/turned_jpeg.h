@@ -13,7 +13,7 @@
 namespace fotomill {
 
 // How the picture is to be turned.
-struct JpegTurnWish {
+struct JpegTurnRequest {
   Orientation turn = Orientation::Upright;  // of the picture as it is seen
   bool seenByExif = true;                   // it is seen as its EXIF orientation says; otherwise as its pixels are stored
   bool trim = false;                        // cut off edges that cannot be turned without loss
@@ -21,14 +21,14 @@ struct JpegTurnWish {
 };
 
 // How a JPEG file was turned.
-enum class JpegTurnWay {
+enum class JpegTurnMethod {
   Pixels,   // turned without loss; the orientation became 1
   Trimmed,  // the same, but for an edge that was cut off
   Tag,      // the orientation of EXIF and XMP alone; everything else is as it was
   Nothing,  // the file says already what it should
 };
 struct JpegTurnResult {
-  JpegTurnWay way = JpegTurnWay::Nothing;
+  JpegTurnMethod method = JpegTurnMethod::Nothing;
   RecordedText obstacle;  // why the pixels were not turned, as a sentence
 };
 
@@ -36,7 +36,7 @@ struct JpegTurnResult {
 // instead, so that nothing is lost. EXIF, XMP and all other segments stay, as do bytes behind the picture; sizes and thumbnail in
 // the EXIF block are turned with the pixels. `made` is empty for Nothing. Statuses: those of reading; UnsuitableImage (13) where
 // neither pixels nor orientation can be changed, with the obstacle.
-Status MakeTurnedJpeg(std::span<const uint8_t> file, const JpegTurnWish& wish, std::vector<uint8_t>& made,
+Status MakeTurnedJpeg(std::span<const uint8_t> file, const JpegTurnRequest& request, std::vector<uint8_t>& made,
                       JpegTurnResult& result);
 
 }  // namespace fotomill

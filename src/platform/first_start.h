@@ -14,7 +14,7 @@ class LaterStart {
   // What the later start was given, byte for byte.
   virtual const std::string& Message() const = 0;
   // Lets the later start end. False when it has given up waiting: it continues by itself, and its message is to be dropped.
-  virtual bool Take() = 0;
+  virtual bool Accept() = 0;
 };
 
 // Has one running program of the user stand for all those of a name: later starts hand over what they were started with. What

@@ -52,7 +52,7 @@ std::string Variable(const char* name) {
 
 // The languages that the environment asks for, the best first, separated by colons. As in gettext, LANGUAGE counts only
 // where a locale is set.
-std::string WishOfSystem() {
+std::string LanguagesOfSystem() {
   std::string locale = Variable("LC_ALL");
   if (locale.empty()) locale = Variable("LC_MESSAGES");
   if (locale.empty()) locale = Variable("LANG");
@@ -61,11 +61,11 @@ std::string WishOfSystem() {
   return languages.empty() ? locale : languages;
 }
 
-// The first language of `wish` that has a catalog, with or without its country; English if none has.
-std::string ChooseLanguage(std::string_view wish, const std::string& folder) {
-  while (!wish.empty()) {
-    const std::string_view item = wish.substr(0, wish.find(':'));
-    wish.remove_prefix(std::min(item.size() + 1, wish.size()));
+// The first language of `wanted` that has a catalog, with or without its country; English if none has.
+std::string ChooseLanguage(std::string_view wanted, const std::string& folder) {
+  while (!wanted.empty()) {
+    const std::string_view item = wanted.substr(0, wanted.find(':'));
+    wanted.remove_prefix(std::min(item.size() + 1, wanted.size()));
     const std::string code(item.substr(0, item.find('.')));
     const std::string country = code.substr(0, code.find('@')), language = code.substr(0, code.find_first_of("_@"));
     for (const std::string& form : {code, country, language}) {
@@ -104,7 +104,7 @@ std::string Filled(std::string_view text, std::span<const TextArgument> argument
 
 bool StartTexts(const std::string& code) {
   const std::string folder = CatalogFolder();
-  state.language = ChooseLanguage(code.empty() ? WishOfSystem() : code, folder);
+  state.language = ChooseLanguage(code.empty() ? LanguagesOfSystem() : code, folder);
   state.translated = state.language != kEnglish;
   if (state.translated || !code.empty()) platform::SetVariable("LANGUAGE", state.language);  // toolkits follow it, too
   if (state.translated) {

@@ -34,7 +34,7 @@ class Player {
  public:
   Player(const std::vector<uint8_t>& file, uint64_t capacity) {
     test::WriteBytes(folder_.Path("a.gif"), file);
-    player_ = std::make_unique<AnimationPlayer>(ViewWish{folder_.Path("a.gif"), 0, 0, 0}, capacity, [] {});
+    player_ = std::make_unique<AnimationPlayer>(ViewRequest{folder_.Path("a.gif"), 0, 0, 0}, capacity, [] {});
   }
   AnimationPlayer* operator->() { return player_.get(); }
 

@@ -153,14 +153,14 @@ TEST(ViewPicture, FollowsItsProfileAndKeepsItsAlpha) {
   cmsFreeToneCurve(linear);
   ASSERT_EQ(WritePicture(*picture, path, {}), Status::Ok);
 
-  ViewWish wish{path, 0, 4, 4, {.profiles = true, .keepAlpha = true}};
-  const ViewPicturePointer managed = LoadViewPicture(wish);
+  ViewRequest request{path, 0, 4, 4, {.profiles = true, .keepAlpha = true}};
+  const ViewPicturePointer managed = LoadViewPicture(request);
   ASSERT_EQ(managed->status, Status::Ok);
   EXPECT_EQ(managed->picture->image.Row(1)[0], 110);  // 40 of light, as sRGB writes it
   EXPECT_EQ(managed->picture->alpha.Width(), 8);
   EXPECT_EQ(managed->fitted.alpha.Width(), 4);
-  wish.look = {};
-  const ViewPicturePointer plain = LoadViewPicture(wish);
+  request.look = {};
+  const ViewPicturePointer plain = LoadViewPicture(request);
   EXPECT_EQ(plain->picture->image.Row(1)[0], 0xc0);  // the background, since all is transparent
   EXPECT_TRUE(plain->picture->alpha.Empty());
   EXPECT_GT(managed->Bytes(), plain->Bytes());
@@ -202,25 +202,25 @@ TEST(Thumbnail, DatabaseModesKeepWhatTheyMade) {
   const test::TemporaryFolder folder;
   const std::string picture = folder.Path("a.bmp");
   std::filesystem::copy_file(test::SourcePath("samples/bmp-true-color.bmp"), picture);
-  ThumbnailWish wish{picture, 1, 1, 96, choice::kLocalDatabase};
+  ThumbnailRequest request{picture, 1, 1, 96, choice::kLocalDatabase};
   for (int time = 0; time < 2; ++time) {  // the second time it comes from the database
-    const ThumbnailPointer thumbnail = LoadThumbnail(wish);
+    const ThumbnailPointer thumbnail = LoadThumbnail(request);
     ASSERT_EQ(thumbnail->status, Status::Ok);
     EXPECT_EQ(thumbnail->pixels.width, 96);
     EXPECT_EQ(thumbnail->width, time == 0 ? 150 : 0);
     KeepThumbnailRecords();
     EXPECT_EQ(std::filesystem::file_size(folder.Path("Fotomill.tdb")), 60u + 28442u);
   }
-  wish.path = folder.Path("a.webp");
-  std::filesystem::copy_file(test::SourcePath("tests/formats/webp/good/frames.webp"), wish.path);
+  request.path = folder.Path("a.webp");
+  std::filesystem::copy_file(test::SourcePath("tests/formats/webp/good/frames.webp"), request.path);
   for (int time = 0; time < 2; ++time) {
-    const ThumbnailPointer thumbnail = LoadThumbnail(wish);
+    const ThumbnailPointer thumbnail = LoadThumbnail(request);
     EXPECT_EQ(thumbnail->pages, 3);
     EXPECT_TRUE(thumbnail->animated && thumbnail->alpha);
     KeepThumbnailRecords();
   }
-  wish = {folder.Path("none.bmp"), 1, 1, 96, choice::kLocalDatabase};
-  EXPECT_EQ(LoadThumbnail(wish)->status, Status::FileOpenError);
+  request = {folder.Path("none.bmp"), 1, 1, 96, choice::kLocalDatabase};
+  EXPECT_EQ(LoadThumbnail(request)->status, Status::FileOpenError);
 }
 
 // A stand-in is the file's own thumbnail, upright as the picture is; where there is none, nothing is decoded.
@@ -233,18 +233,18 @@ TEST(Thumbnail, StandInsComeFromTheExif) {
   ASSERT_TRUE(ReplaceExifThumbnail(picture->metadata.exif, test::ReadBytes(small), 65527));
   ASSERT_EQ(WritePicture(*picture, large, {}), Status::Ok);
   std::filesystem::copy_file(test::SourcePath("samples/bmp-true-color.bmp"), plain);
-  ThumbnailWish wish{large, 1, 1, 176, choice::kDiskBased, true};
-  const ThumbnailPointer standIn = LoadThumbnail(wish);
+  ThumbnailRequest request{large, 1, 1, 176, choice::kDiskBased, true};
+  const ThumbnailPointer standIn = LoadThumbnail(request);
   ASSERT_NE(standIn, nullptr);
   EXPECT_TRUE(standIn->standIn);
   EXPECT_EQ(standIn->pixels.width, 12);
-  wish.standIn = false;
-  EXPECT_EQ(LoadThumbnail(wish)->pixels.height, 176);
-  wish = {plain, 1, 1, 96, choice::kDiskBased, true};
-  EXPECT_EQ(LoadThumbnail(wish), nullptr);
+  request.standIn = false;
+  EXPECT_EQ(LoadThumbnail(request)->pixels.height, 176);
+  request = {plain, 1, 1, 96, choice::kDiskBased, true};
+  EXPECT_EQ(LoadThumbnail(request), nullptr);
   ASSERT_EQ(WriteThumbnail(plain, {}), Status::Ok);
-  wish.side = 48;
-  const ThumbnailPointer ready = LoadThumbnail(wish);  // the proper one, smaller than its record
+  request.side = 48;
+  const ThumbnailPointer ready = LoadThumbnail(request);  // the proper one, smaller than its record
   ASSERT_NE(ready, nullptr);
   EXPECT_FALSE(ready->standIn);
   EXPECT_EQ(ready->pixels.width, 48);
@@ -255,12 +255,12 @@ std::condition_variable opened;
 std::atomic<int> loads{0};
 bool open = false;
 
-ThumbnailPointer SlowThumbnail(const ThumbnailWish& wish) {
+ThumbnailPointer SlowThumbnail(const ThumbnailRequest& request) {
   ++loads;
   std::unique_lock lock(gate);
   opened.wait(lock, [] { return open; });
   auto thumbnail = std::make_shared<Thumbnail>();
-  thumbnail->width = static_cast<int32_t>(wish.size);
+  thumbnail->width = static_cast<int32_t>(request.size);
   return thumbnail;
 }
 
@@ -268,16 +268,16 @@ TEST(ThumbnailLoader, ForgetsWhatIsNoLongerWanted) {
   std::atomic<int> wakes{0};
   ThumbnailLoader loader(
       1, [&] { ++wakes; }, SlowThumbnail);
-  const auto wish = [](const char* path) { return ThumbnailWish{path, 1, 2, 96, 0}; };
-  loader.Want({wish("a"), wish("b"), wish("c")});
+  const auto request = [](const char* path) { return ThumbnailRequest{path, 1, 2, 96, 0}; };
+  loader.Want({request("a"), request("b"), request("c")});
   while (loads == 0) std::this_thread::yield();
-  loader.Want({wish("a"), wish("d")});  // a is in work
+  loader.Want({request("a"), request("d")});  // a is in work
   {
     const std::lock_guard lock(gate);
     open = true;
   }
   opened.notify_all();
-  while (loads < 2 || loader.Pending() > loader.TakeResults().size()) {
+  while (loads < 2 || loader.Pending() > loader.FetchResults().size()) {
     if (loads == 2 && loader.Pending() == 0) break;
     std::this_thread::yield();
   }
@@ -288,39 +288,39 @@ TEST(ThumbnailLoader, ForgetsWhatIsNoLongerWanted) {
 TEST(ThumbnailLoader, AReadyThumbnailIsLoadedOnce) {
   static std::atomic<int> calls;
   static std::atomic<bool> idle;
-  const auto load = [](const ThumbnailWish& wish) {
+  const auto load = [](const ThumbnailRequest& request) {
     ++calls;
     auto thumbnail = std::make_shared<Thumbnail>();
-    thumbnail->standIn = wish.standIn && wish.path == "embedded";
-    return ThumbnailPointer(wish.standIn && wish.path == "none" ? nullptr : thumbnail);
+    thumbnail->standIn = request.standIn && request.path == "embedded";
+    return ThumbnailPointer(request.standIn && request.path == "none" ? nullptr : thumbnail);
   };
   ThumbnailLoader loader(
       1, [] {}, load, [] { idle = true; });
-  std::vector<ThumbnailWish> wishes;
+  std::vector<ThumbnailRequest> requests;
   for (const bool standIn : {true, false}) {
-    for (const char* path : {"ready", "embedded", "none"}) wishes.push_back({path, 1, 2, 96, 0, standIn});
+    for (const char* path : {"ready", "embedded", "none"}) requests.push_back({path, 1, 2, 96, 0, standIn});
   }
-  loader.Want(wishes);
+  loader.Want(requests);
   while (!idle) std::this_thread::yield();
   EXPECT_EQ(calls, 5);
   std::string order;
-  for (const auto& result : loader.TakeResults()) {
-    order += result.wish.path + (result.wish.standIn ? "?" : "") + (result.thumbnail == nullptr ? "- " : " ");
+  for (const auto& result : loader.FetchResults()) {
+    order += result.request.path + (result.request.standIn ? "?" : "") + (result.thumbnail == nullptr ? "- " : " ");
   }
   EXPECT_EQ(order, "ready embedded? none?- embedded none ");
 }
 
 TEST(ThumbnailLoader, AFileThatNeedsTooMuchMemoryIsNoEndOfTheProgram) {
   static std::atomic<bool> idle;
-  const auto load = [](const ThumbnailWish& wish) -> ThumbnailPointer {
-    if (wish.path == "huge") throw std::bad_alloc();
+  const auto load = [](const ThumbnailRequest& request) -> ThumbnailPointer {
+    if (request.path == "huge") throw std::bad_alloc();
     return std::make_shared<Thumbnail>();
   };
   ThumbnailLoader loader(
       1, [] {}, load, [] { idle = true; });
   loader.Want({{"huge", 1, 2, 96, 0}, {"small", 1, 2, 96, 0}});
   while (!idle) std::this_thread::yield();
-  const auto results = loader.TakeResults();
+  const auto results = loader.FetchResults();
   ASSERT_EQ(results.size(), 2u);
   EXPECT_EQ(results[0].thumbnail->status, Status::MemoryAllocationError);
   EXPECT_EQ(results[1].thumbnail->status, Status::Ok);
@@ -334,15 +334,15 @@ TEST(ThumbnailCache, KeepsTheLastUsedWithinItsBytes) {
     return thumbnail;
   };
   ThumbnailCache cache(3 * picture()->Bytes());
-  const auto wish = [](const char* path, int64_t modified) { return ThumbnailWish{path, modified, 0, 96, 0}; };
-  for (const char* path : {"a", "b", "c"}) cache.Put(wish(path, 1), picture());
-  EXPECT_NE(cache.Find(wish("a", 1)), nullptr);
-  cache.Put(wish("d", 1), picture());
+  const auto request = [](const char* path, int64_t modified) { return ThumbnailRequest{path, modified, 0, 96, 0}; };
+  for (const char* path : {"a", "b", "c"}) cache.Put(request(path, 1), picture());
+  EXPECT_NE(cache.Find(request("a", 1)), nullptr);
+  cache.Put(request("d", 1), picture());
   EXPECT_EQ(cache.Count(), 3u);
-  EXPECT_EQ(cache.Find(wish("b", 1)), nullptr);
-  EXPECT_EQ(cache.Find(wish("a", 2)), nullptr);  // the file has changed
+  EXPECT_EQ(cache.Find(request("b", 1)), nullptr);
+  EXPECT_EQ(cache.Find(request("a", 2)), nullptr);  // the file has changed
   EXPECT_NE(cache.FindAny("a"), nullptr);
-  cache.Put(wish("a", 2), picture());
+  cache.Put(request("a", 2), picture());
   EXPECT_EQ(cache.Bytes(), 3 * picture()->Bytes());
 }
 

@@ -21,9 +21,9 @@ using Bytes = std::vector<uint8_t>;
 constexpr const char* kTransforms[] = {"-flip horizontal", "-rotate 180", "-flip vertical", "-transpose",
                                        "-rotate 90",       "-transverse", "-rotate 270"};
 
-Bytes Turned(const Bytes& file, const JpegTurnWish& wish, JpegTurnResult& result) {
+Bytes Turned(const Bytes& file, const JpegTurnRequest& request, JpegTurnResult& result) {
   Bytes made;
-  EXPECT_EQ(MakeTurnedJpeg(file, wish, made, result), Status::Ok);
+  EXPECT_EQ(MakeTurnedJpeg(file, request, made, result), Status::Ok);
   return made;
 }
 
@@ -52,19 +52,19 @@ TEST(TurnedJpeg, PixelsAreThoseOfJpegtran) {
         const auto orientation = static_cast<Orientation>(number);
         const Bytes ours = Turned(file, {.turn = orientation}, result);
         if (RunShell(command + "-perfect " + old)) {
-          ASSERT_EQ(result.way, JpegTurnWay::Pixels) << result.obstacle.english;
+          ASSERT_EQ(result.method, JpegTurnMethod::Pixels) << result.obstacle.english;
           EXPECT_TRUE(LookAlike(ours, ReadBytes(theirs)));
           EXPECT_EQ(Decode(JpegRead, ours).picture->typeName.view(), Decode(JpegRead, file).picture->typeName.view());
           continue;
         }
-        ASSERT_EQ(result.way, JpegTurnWay::Tag);
+        ASSERT_EQ(result.method, JpegTurnMethod::Tag);
         EXPECT_FALSE(result.obstacle.empty());
         EXPECT_TRUE(std::ranges::equal(std::span(ours).last(file.size() - 2), std::span(file).last(file.size() - 2)) ||
                     LookAlike(ours, file));
         EXPECT_EQ(ExifOrientation(Decode(JpegRead, ours).picture->metadata.exif), number);
         const Bytes trimmed = Turned(file, {.turn = orientation, .trim = true}, result);
-        if (result.way == JpegTurnWay::Tag) continue;  // there is no whole block
-        ASSERT_EQ(result.way, JpegTurnWay::Trimmed);
+        if (result.method == JpegTurnMethod::Tag) continue;  // there is no whole block
+        ASSERT_EQ(result.method, JpegTurnMethod::Trimmed);
         ASSERT_TRUE(RunShell(command + "-trim " + old));
         EXPECT_TRUE(LookAlike(trimmed, ReadBytes(theirs)));
       }
@@ -105,7 +105,7 @@ TEST(TurnedJpeg, WhatBelongsToAPictureTurnsWithIt) {
     const Bytes file = FullFile(64, 48, PatternPicture(row.thumbnailWidth, 24, 24));
     JpegTurnResult result;
     const Bytes made = Turned(file, {.turn = row.turn}, result);
-    ASSERT_EQ(result.way, JpegTurnWay::Pixels);
+    ASSERT_EQ(result.method, JpegTurnMethod::Pixels);
     const PicturePointer picture = Decode(JpegRead, made).picture, old = Decode(JpegRead, file).picture;
     EXPECT_EQ(picture->width, row.width);
     EXPECT_EQ(ExifOrientation(picture->metadata.exif), 1);
@@ -126,7 +126,7 @@ TEST(TurnedJpeg, WhatBelongsToAPictureTurnsWithIt) {
     const Bytes raw = Turned(file, {.turn = Orientation::HalfTurn, .seenByExif = false}, result);
     EXPECT_EQ(Decode(JpegRead, raw).picture->width, 64);
     (void)Turned(file, {.turn = Orientation::QuarterLeft}, result);
-    EXPECT_EQ(result.way, JpegTurnWay::Tag);
+    EXPECT_EQ(result.method, JpegTurnMethod::Tag);
     EXPECT_TRUE(result.obstacle.empty());
   }
 }
@@ -146,16 +146,16 @@ TEST(TurnedJpeg, UnfitFilesKeepTheirPixels) {
   for (const Bytes& file : {flawed, several, split}) {
     JpegTurnResult result;
     const Bytes made = Turned(file, {.turn = Orientation::HalfTurn}, result);
-    EXPECT_EQ(result.way, JpegTurnWay::Tag);
+    EXPECT_EQ(result.method, JpegTurnMethod::Tag);
     EXPECT_EQ(ExifOrientation(Decode(JpegRead, made).picture->metadata.exif), 8);
     EXPECT_EQ(made.size(), file.size());
     EXPECT_EQ(Bytes(made.end() - 500, made.end()), Bytes(file.end() - 500, file.end()));
   }
   Bytes made;
   JpegTurnResult result;
-  const JpegTurnWish wish{.turn = Orientation::HalfTurn};
-  EXPECT_EQ(MakeTurnedJpeg(std::span(sound).first(sound.size() - 500), wish, made, result), Status::FileReadError);
-  EXPECT_EQ(MakeTurnedJpeg(Hex("FFD8FFD9"), wish, made, result), Status::DamagedFile);
+  const JpegTurnRequest request{.turn = Orientation::HalfTurn};
+  EXPECT_EQ(MakeTurnedJpeg(std::span(sound).first(sound.size() - 500), request, made, result), Status::FileReadError);
+  EXPECT_EQ(MakeTurnedJpeg(Hex("FFD8FFD9"), request, made, result), Status::DamagedFile);
   EXPECT_TRUE(made.empty());
 }
 

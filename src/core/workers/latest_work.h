@@ -10,7 +10,7 @@
 namespace fotomill {
 
 // Work of which only what is wanted now counts: there is no queue that could grow old. A thread that is free asks for the most
-// urgent piece, does it, and asks again. The owner keeps its wishes under a lock of its own, and changes them as it likes.
+// urgent piece, does it, and asks again. The owner keeps its requests under a lock of its own, and changes them as it likes.
 class LatestWork {
  public:
   using Piece = std::function<void()>;

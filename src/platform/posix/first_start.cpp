@@ -96,7 +96,7 @@ class Caller : public LaterStart {
  public:
   Caller(Handle socket, std::string message) : socket_(std::move(socket)), message_(std::move(message)) {}
   const std::string& Message() const override { return message_; }
-  bool Take() override {
+  bool Accept() override {
     // One that has given up has closed its end.
     pollfd state = {socket_.Number(), POLLOUT, 0};
     if (poll(&state, 1, 0) != 1 || (state.revents & (POLLHUP | POLLERR)) != 0) return false;

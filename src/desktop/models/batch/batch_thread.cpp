@@ -60,25 +60,25 @@ class BatchThread::Box : public ProgressBox {
  public:
   explicit Box(BatchThread& batch) : batch_(batch) {}
   bool Open(const ProgressModel&) override {
-    batch_.Tell([&windows = batch_.windows_] { windows.BatchOpened(); });
+    batch_.PostToWindows([&windows = batch_.windows_] { windows.BatchOpened(); });
     return true;
   }
   void ShowLine(const ProgressLine& line, const FileOutcome* outcome) override {
-    batch_.Tell([&windows = batch_.windows_, line, copy = outcome == nullptr ? FileOutcome() : *outcome] {
+    batch_.PostToWindows([&windows = batch_.windows_, line, copy = outcome == nullptr ? FileOutcome() : *outcome] {
       windows.BatchLine(line, copy);
     });
   }
   void ShowStatus(const std::string& status) override {
-    batch_.Tell([&windows = batch_.windows_, status] { windows.BatchStatus(status); });
+    batch_.PostToWindows([&windows = batch_.windows_, status] { windows.BatchStatus(status); });
   }
   void ShowProgress(uint32_t done, uint32_t count) override {
-    batch_.Tell([&windows = batch_.windows_, done, count] { windows.BatchProgress(done, count); });
+    batch_.PostToWindows([&windows = batch_.windows_, done, count] { windows.BatchProgress(done, count); });
   }
   void StayOpen(const ProgressModel& model) override {
-    batch_.Tell([&windows = batch_.windows_, model] { windows.BatchStaysOpen(model); });
+    batch_.PostToWindows([&windows = batch_.windows_, model] { windows.BatchStaysOpen(model); });
   }
   void Close(const ProgressModel&) override {
-    batch_.Tell([&windows = batch_.windows_] { windows.BatchCloses(); });
+    batch_.PostToWindows([&windows = batch_.windows_] { windows.BatchCloses(); });
   }
 
  private:
@@ -146,7 +146,7 @@ void BatchThread::StartWork(BatchJob job, Work work) {
   task_.Wait();
   job_ = std::move(job);
   // The settings belong to the window's thread.
-  job_.remember = [this](Remembered what, int32_t value) { Tell([what, value] { StoreRemembered(what, value); }); };
+  job_.remember = [this](Remembered what, int32_t value) { PostToWindows([what, value] { StoreRemembered(what, value); }); };
   running_ = true;
   const auto run = [this, work = std::move(work), thumbnails = ThumbnailOptionsFromSettings()](const StopToken&) {
     Box box(*this);
@@ -158,7 +158,7 @@ void BatchThread::StartWork(BatchJob job, Work work) {
   task_.Start(Lane::Blocking, run, [this](Status status) {
     job_.box = nullptr;
     job_.prompts = nullptr;
-    Tell([this, status] {
+    PostToWindows([this, status] {
       running_ = false;
       windows_.BatchEnded(status, job_);
     });
@@ -173,7 +173,7 @@ bool BatchThread::AskWindow(const std::function<void()>& action) {
     bool dropped = false;
   };
   auto turn = std::make_shared<Turn>();
-  Tell([this, turn, action] {
+  PostToWindows([this, turn, action] {
     {
       const std::lock_guard lock(turn->mutex);
       if (turn->dropped) return;

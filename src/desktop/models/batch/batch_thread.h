@@ -73,7 +73,7 @@ class BatchThread {
   class Questions;
   // Runs `action` on the window's thread and waits for it. False when the batch is being given up.
   bool AskWindow(const std::function<void()>& action);
-  void Tell(std::function<void()> action) { post_(std::move(action)); }
+  void PostToWindows(std::function<void()> action) { post_(std::move(action)); }
 
   BatchWindows& windows_;
   const Post post_;

@@ -21,35 +21,35 @@ namespace fotomill::desktop {
 
 namespace {
 
-bool ReadCurrentFile(const ThumbnailWish& wish, ThumbnailRecord& record) {
-  const std::string path = ThumbnailPathFor(wish.path);
+bool ReadCurrentFile(const ThumbnailRequest& request, ThumbnailRecord& record) {
+  const std::string path = ThumbnailPathFor(request.path);
   const platform::FileFacts facts = platform::FactsOf(path);
-  return facts.kind == platform::FileKind::Regular && facts.modified >= wish.modified && ReadThumbnailFile(record, path);
+  return facts.kind == platform::FileKind::Regular && facts.modified >= request.modified && ReadThumbnailFile(record, path);
 }
 
-bool InDatabase(const ThumbnailWish& wish) { return wish.mode == choice::kGlobalDatabase || wish.mode == choice::kLocalDatabase; }
+bool InDatabase(const ThumbnailRequest& request) { return request.mode == choice::kGlobalDatabase || request.mode == choice::kLocalDatabase; }
 
-std::string DatabaseFor(const ThumbnailWish& wish) {
-  return ThumbnailDatabasePath(wish.mode == choice::kGlobalDatabase ? std::string()
-                                                                    : std::string(platform::SplitPath(wish.path).folder));
+std::string DatabaseFor(const ThumbnailRequest& request) {
+  return ThumbnailDatabasePath(request.mode == choice::kGlobalDatabase ? std::string()
+                                                                    : std::string(platform::SplitPath(request.path).folder));
 }
 
 // The database that was asked last stays open: its index is what makes a search quick. New records are gathered, since
 // every append waits for the disk.
 class OpenDatabase {
  public:
-  bool Find(const ThumbnailWish& wish, ThumbnailRecord& record) {
+  bool Find(const ThumbnailRequest& request, ThumbnailRecord& record) {
     const std::lock_guard lock(mutex_);
-    hidden_ = wish.options.hidden;
-    return Open(DatabaseFor(wish), false) && database_.Find(wish.path, VolumeKeyFor(wish.path), record);
+    hidden_ = request.options.hidden;
+    return Open(DatabaseFor(request), false) && database_.Find(request.path, VolumeKeyFor(request.path), record);
   }
-  void Add(const ThumbnailWish& wish, const ThumbnailRecord& record) {
+  void Add(const ThumbnailRequest& request, const ThumbnailRecord& record) {
     const std::lock_guard lock(mutex_);
-    const std::string path = DatabaseFor(wish);
+    const std::string path = DatabaseFor(request);
     if (path != newPath_ || new_.size() >= kGathered) Write();
     newPath_ = path;
-    hidden_ = wish.options.hidden;
-    new_.push_back({record, wish.path, VolumeKeyFor(wish.path), false});
+    hidden_ = request.options.hidden;
+    new_.push_back({record, request.path, VolumeKeyFor(request.path), false});
   }
   void Flush() {
     const std::lock_guard lock(mutex_);
@@ -86,12 +86,12 @@ class OpenDatabase {
 };
 OpenDatabase openDatabase;
 
-bool FindRecord(const ThumbnailWish& wish, ThumbnailRecord& record) {
-  if (wish.side > kSmallThumbnailSide) return false;  // a record would have to be enlarged
-  if (wish.mode == choice::kDiskBased || wish.options.fromFiles) {
-    if (ReadCurrentFile(wish, record)) return true;
+bool FindRecord(const ThumbnailRequest& request, ThumbnailRecord& record) {
+  if (request.side > kSmallThumbnailSide) return false;  // a record would have to be enlarged
+  if (request.mode == choice::kDiskBased || request.options.fromFiles) {
+    if (ReadCurrentFile(request, record)) return true;
   }
-  return InDatabase(wish) && openDatabase.Find(wish, record);
+  return InDatabase(request) && openDatabase.Find(request, record);
 }
 
 Status ScaleDown(const PackedImage& image, int32_t side, RgbImage& pixels) {
@@ -102,41 +102,41 @@ Status ScaleDown(const PackedImage& image, int32_t side, RgbImage& pixels) {
   return ToRgb(scaled, pixels);
 }
 
-Status PixelsOfRecord(const ThumbnailRecord& record, const ThumbnailWish& wish, RgbImage& pixels) {
+Status PixelsOfRecord(const ThumbnailRecord& record, const ThumbnailRequest& request, RgbImage& pixels) {
   PackedImage bitmap;
   RETURN_IF_BAD(ThumbnailRecordToBitmap(record, bitmap));
   RETURN_IF_BAD(ToRgb(bitmap, pixels));
-  pixels = WithoutMatte(pixels, wish.options.matte);
-  if (std::max(pixels.width, pixels.height) <= wish.side) return Status::Ok;
+  pixels = WithoutMatte(pixels, request.options.matte);
+  if (std::max(pixels.width, pixels.height) <= request.side) return Status::Ok;
   RETURN_IF_BAD(ToPacked(pixels, bitmap));
-  return ScaleDown(bitmap, wish.side, pixels);
+  return ScaleDown(bitmap, request.side, pixels);
 }
 
-Status PixelsOfPicture(PictureRecord& picture, const ThumbnailWish& wish, RgbImage& pixels) {
-  RETURN_IF_BAD(PrepareForDisplay(picture, wish.options.matte));
-  return ScaleDown(picture.image, wish.side, pixels);
+Status PixelsOfPicture(PictureRecord& picture, const ThumbnailRequest& request, RgbImage& pixels) {
+  RETURN_IF_BAD(PrepareForDisplay(picture, request.options.matte));
+  return ScaleDown(picture.image, request.side, pixels);
 }
 
 // A thumbnail that somebody has made before.
-bool ReadReady(const ThumbnailWish& wish, Thumbnail& thumbnail) {
+bool ReadReady(const ThumbnailRequest& request, Thumbnail& thumbnail) {
   ThumbnailRecord record;
-  if (FindRecord(wish, record) && PixelsOfRecord(record, wish, thumbnail.pixels) == Status::Ok) return true;
+  if (FindRecord(request, record) && PixelsOfRecord(record, request, thumbnail.pixels) == Status::Ok) return true;
   const bool fromSystem =
-      wish.mode == choice::kDiskBased && wish.options.fromSystem && wish.side > kSmallThumbnailSide;
-  const PicturePointer picture = fromSystem ? ReadSystemPicture(wish.path, wish.side) : nullptr;
-  return picture != nullptr && PixelsOfPicture(*picture, wish, thumbnail.pixels) == Status::Ok;
+      request.mode == choice::kDiskBased && request.options.fromSystem && request.side > kSmallThumbnailSide;
+  const PicturePointer picture = fromSystem ? ReadSystemPicture(request.path, request.side) : nullptr;
+  return picture != nullptr && PixelsOfPicture(*picture, request, thumbnail.pixels) == Status::Ok;
 }
 
 // The thumbnail in the file's EXIF, upright as the picture would be.
-bool ReadEmbedded(const ThumbnailWish& wish, Thumbnail& thumbnail) {
+bool ReadEmbedded(const ThumbnailRequest& request, Thumbnail& thumbnail) {
   ExifSource source;
   ExifFindings findings;
-  if (source.Open(wish.path.c_str()) != Status::Ok || !WalkExif(source.Block(), nullptr, &findings)) return false;
+  if (source.Open(request.path.c_str()) != Status::Ok || !WalkExif(source.Block(), nullptr, &findings)) return false;
   PicturePointer picture;
   if (DecodeExifThumbnail(ExifThumbnail(source.Block(), findings), picture) != Status::Ok) return false;
   picture->metadata.exif.assign(source.Block().begin(), source.Block().end());
   thumbnail.standIn = true;
-  return PixelsOfPicture(*picture, wish, thumbnail.pixels) == Status::Ok && source.Intact();
+  return PixelsOfPicture(*picture, request, thumbnail.pixels) == Status::Ok && source.Intact();
 }
 
 void CopyFacts(const PictureRecord& picture, Thumbnail& thumbnail) {
@@ -156,30 +156,30 @@ void ReadPages(const std::string& path, const ReadOptions& options, Thumbnail& t
   if (LoadPictureInfo({.fileName = path, .options = options}, picture) == Status::Ok) CopyFacts(*picture, thumbnail);
 }
 
-Status MakeFromPicture(const ThumbnailWish& wish, Thumbnail& thumbnail) {
+Status MakeFromPicture(const ThumbnailRequest& request, Thumbnail& thumbnail) {
   PicturePointer picture;
-  const ReadRequest request{.fileName = wish.path, .thumbnailSide = wish.side, .options = wish.options.read};
-  RETURN_IF_BAD(LoadPictureInfo(request, picture));
+  const ReadRequest read{.fileName = request.path, .thumbnailSide = request.side, .options = request.options.read};
+  RETURN_IF_BAD(LoadPictureInfo(read, picture));
   CopyFacts(*picture, thumbnail);
-  RETURN_IF_BAD(ReadPicture(request, *picture));
+  RETURN_IF_BAD(ReadPicture(read, *picture));
   thumbnail.alpha = !picture->alpha.Empty();
-  RETURN_IF_BAD(PrepareForDisplay(*picture, wish.options.matte));
+  RETURN_IF_BAD(PrepareForDisplay(*picture, request.options.matte));
   ThumbnailRecord record;
-  if (InDatabase(wish) && wish.options.keep && MakeThumbnailRecord(record, *picture, wish.options))
-    openDatabase.Add(wish, record);
-  return ScaleDown(picture->image, wish.side, thumbnail.pixels);
+  if (InDatabase(request) && request.options.keep && MakeThumbnailRecord(record, *picture, request.options))
+    openDatabase.Add(request, record);
+  return ScaleDown(picture->image, request.side, thumbnail.pixels);
 }
 
 }  // namespace
 
-ThumbnailPointer LoadThumbnail(const ThumbnailWish& wish) {
+ThumbnailPointer LoadThumbnail(const ThumbnailRequest& request) {
   auto thumbnail = std::make_shared<Thumbnail>();
-  if (ReadReady(wish, *thumbnail)) {
-    ReadPages(wish.path, wish.options.read, *thumbnail);
+  if (ReadReady(request, *thumbnail)) {
+    ReadPages(request.path, request.options.read, *thumbnail);
     return thumbnail;
   }
-  if (wish.standIn) return ReadEmbedded(wish, *thumbnail) ? thumbnail : nullptr;
-  thumbnail->status = MakeFromPicture(wish, *thumbnail);
+  if (request.standIn) return ReadEmbedded(request, *thumbnail) ? thumbnail : nullptr;
+  thumbnail->status = MakeFromPicture(request, *thumbnail);
   if (thumbnail->status != Status::Ok) thumbnail->pixels = {};
   return thumbnail;
 }

@@ -11,7 +11,7 @@
 namespace fotomill::desktop {
 
 // What a thumbnail is wanted for. The file's time and size are part of it: a changed file is another one.
-struct ThumbnailWish {
+struct ThumbnailRequest {
   std::string path;
   int64_t modified = 0;
   uint64_t size = 0;
@@ -20,7 +20,7 @@ struct ThumbnailWish {
   bool standIn = false;  // whatever can be had at once will do, until the proper one comes
   ThumbnailOptions options = {};
 
-  bool operator==(const ThumbnailWish&) const = default;
+  bool operator==(const ThumbnailRequest&) const = default;
 };
 
 // What a list shows of a picture. It does not change once it is made, so that threads may share it.
@@ -38,9 +38,9 @@ using ThumbnailPointer = std::shared_ptr<const Thumbnail>;
 
 // Gets a picture's thumbnail: a record from its thumbnail file or the database of the browser's mode when that is as new as the
 // picture and large enough, the system's own where large ones may come from there, else from the picture itself. Takes as long
-// as it takes; called by workers. A wish for a stand-in decodes no picture: it gets the proper thumbnail when there is one
+// as it takes; called by workers. A request for a stand-in decodes no picture: it gets the proper thumbnail when there is one
 // ready, else the one that the file holds, and null when it holds none.
-ThumbnailPointer LoadThumbnail(const ThumbnailWish& wish);
+ThumbnailPointer LoadThumbnail(const ThumbnailRequest& request);
 
 // Whether files of a row of the registry can hold a thumbnail of their own.
 bool MayHoldThumbnail(int32_t format);

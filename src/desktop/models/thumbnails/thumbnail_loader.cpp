@@ -10,40 +10,40 @@ namespace fotomill::desktop {
 ThumbnailLoader::ThumbnailLoader(unsigned atOnce, std::function<void()> wake, Load load, void (*idle)())
     : wake_(std::move(wake)), load_(load), idle_(idle), work_(Lane::Compute, atOnce, [this] { return Next(); }) {}
 
-void ThumbnailLoader::Want(std::vector<ThumbnailWish> wishes) {
+void ThumbnailLoader::Want(std::vector<ThumbnailRequest> requests) {
   {
     const std::lock_guard lock(mutex_);
-    std::erase_if(wishes, [this](const ThumbnailWish& wish) { return std::ranges::find(inWork_, wish) != inWork_.end(); });
-    std::reverse(wishes.begin(), wishes.end());
-    wishes_ = std::move(wishes);
+    std::erase_if(requests, [this](const ThumbnailRequest& request) { return std::ranges::find(inWork_, request) != inWork_.end(); });
+    std::reverse(requests.begin(), requests.end());
+    requests_ = std::move(requests);
   }
   work_.Look();
 }
 
-std::vector<ThumbnailLoader::Result> ThumbnailLoader::TakeResults() {
+std::vector<ThumbnailLoader::Result> ThumbnailLoader::FetchResults() {
   const std::lock_guard lock(mutex_);
   return std::exchange(results_, {});
 }
 
 size_t ThumbnailLoader::Pending() const {
   const std::lock_guard lock(mutex_);
-  return wishes_.size() + inWork_.size() + results_.size();
+  return requests_.size() + inWork_.size() + results_.size();
 }
 
 LatestWork::Piece ThumbnailLoader::Next() {
   const std::lock_guard lock(mutex_);
-  if (wishes_.empty()) return {};
-  ThumbnailWish wish = std::move(wishes_.back());
-  wishes_.pop_back();
-  inWork_.push_back(wish);
-  return [this, wish = std::move(wish)] { LoadOne(wish); };
+  if (requests_.empty()) return {};
+  ThumbnailRequest request = std::move(requests_.back());
+  requests_.pop_back();
+  inWork_.push_back(request);
+  return [this, request = std::move(request)] { LoadOne(request); };
 }
 
-void ThumbnailLoader::LoadOne(ThumbnailWish wish) {
+void ThumbnailLoader::LoadOne(ThumbnailRequest request) {
   ThumbnailPointer thumbnail;
   const Status status = Guarded([&] {
-    const FolderScope folder(wish.path);
-    thumbnail = load_(wish);
+    const FolderScope folder(request.path);
+    thumbnail = load_(request);
   });
   if (status != Status::Ok) {
     auto failed = std::make_shared<Thumbnail>();
@@ -51,14 +51,14 @@ void ThumbnailLoader::LoadOne(ThumbnailWish wish) {
     thumbnail = std::move(failed);
   }
   std::unique_lock lock(mutex_);
-  inWork_.erase(std::ranges::find(inWork_, wish));
-  if (wish.standIn && thumbnail != nullptr && !thumbnail->standIn) {
-    wish.standIn = false;
-    std::erase(wishes_, wish);
+  inWork_.erase(std::ranges::find(inWork_, request));
+  if (request.standIn && thumbnail != nullptr && !thumbnail->standIn) {
+    request.standIn = false;
+    std::erase(requests_, request);
   }
   const bool tell = results_.empty();
-  results_.push_back({std::move(wish), std::move(thumbnail)});
-  const bool last = wishes_.empty() && inWork_.empty();
+  results_.push_back({std::move(request), std::move(thumbnail)});
+  const bool last = requests_.empty() && inWork_.empty();
   lock.unlock();
   if (tell) wake_();
   if (last) idle_();
@@ -66,9 +66,9 @@ void ThumbnailLoader::LoadOne(ThumbnailWish wish) {
 
 unsigned ThumbnailsAtOnce() { return std::max(WorkerPool::Shared().Cores(), 2u) - 1; }
 
-ThumbnailPointer ThumbnailCache::Find(const ThumbnailWish& wish) {
-  const auto found = places_.find(wish.path);
-  if (found == places_.end() || found->second->wish != wish) return nullptr;
+ThumbnailPointer ThumbnailCache::Find(const ThumbnailRequest& request) {
+  const auto found = places_.find(request.path);
+  if (found == places_.end() || found->second->request != request) return nullptr;
   entries_.splice(entries_.begin(), entries_, found->second);
   return found->second->thumbnail;
 }
@@ -78,18 +78,18 @@ ThumbnailPointer ThumbnailCache::FindAny(const std::string& path) const {
   return found == places_.end() ? nullptr : found->second->thumbnail;
 }
 
-void ThumbnailCache::Put(const ThumbnailWish& wish, ThumbnailPointer thumbnail) {
-  if (const auto found = places_.find(wish.path); found != places_.end()) {
+void ThumbnailCache::Put(const ThumbnailRequest& request, ThumbnailPointer thumbnail) {
+  if (const auto found = places_.find(request.path); found != places_.end()) {
     bytes_ -= found->second->thumbnail->Bytes();
     entries_.erase(found->second);
     places_.erase(found);
   }
   bytes_ += thumbnail->Bytes();
-  entries_.push_front({wish, std::move(thumbnail)});
-  places_[wish.path] = entries_.begin();
+  entries_.push_front({request, std::move(thumbnail)});
+  places_[request.path] = entries_.begin();
   while (bytes_ > capacity_ && entries_.size() > 1) {
     bytes_ -= entries_.back().thumbnail->Bytes();
-    places_.erase(entries_.back().wish.path);
+    places_.erase(entries_.back().request.path);
     entries_.pop_back();
   }
 }

@@ -13,20 +13,20 @@
 
 namespace fotomill::desktop {
 
-// Loads thumbnails on threads of the pool, in the order in which they are wanted now. The wish of a result tells whether it is a
+// Loads thumbnails on threads of the pool, in the order in which they are wanted now. The request of a result tells whether it is a
 // stand-in; its thumbnail is null when there is none. Where a stand-in was wanted and the proper one was ready, nobody loads it
 // again.
 class ThumbnailLoader {
  public:
-  // A wish that was dealt with.
+  // A request that was dealt with.
   struct Result {
-    ThumbnailWish wish;
+    ThumbnailRequest request;
     ThumbnailPointer thumbnail;
   };
-  using Load = ThumbnailPointer (*)(const ThumbnailWish& wish);
+  using Load = ThumbnailPointer (*)(const ThumbnailRequest& request);
 
   // `wake` is called on a worker when results wait that nobody was told of yet, `idle` on the worker that has done the last
-  // wish.
+  // request.
   ThumbnailLoader(unsigned atOnce, std::function<void()> wake, Load load = LoadThumbnail, void (*idle)() = KeepThumbnailRecords);
   // Waits for what is in work.
   ~ThumbnailLoader() = default;
@@ -34,21 +34,21 @@ class ThumbnailLoader {
   ThumbnailLoader& operator=(const ThumbnailLoader&) = delete;
 
   // Sets the wanted thumbnails, most urgent first. Pending requests are replaced; running ones finish.
-  void Want(std::vector<ThumbnailWish> wishes);
-  std::vector<Result> TakeResults();
+  void Want(std::vector<ThumbnailRequest> requests);
+  std::vector<Result> FetchResults();
   // Thumbnails that wait or are in progress.
   size_t Pending() const;
 
  private:
   LatestWork::Piece Next();
-  void LoadOne(ThumbnailWish wish);
+  void LoadOne(ThumbnailRequest request);
 
   const std::function<void()> wake_;
   const Load load_;
   void (*const idle_)();
   mutable std::mutex mutex_;
-  std::vector<ThumbnailWish> wishes_;  // the most urgent last
-  std::vector<ThumbnailWish> inWork_;  // one a thread
+  std::vector<ThumbnailRequest> requests_;  // the most urgent last
+  std::vector<ThumbnailRequest> inWork_;  // one a thread
   std::vector<Result> results_;
   LatestWork work_;  // last: it uses the rest
 };
@@ -61,17 +61,17 @@ class ThumbnailCache {
  public:
   explicit ThumbnailCache(uint64_t capacity) : capacity_(capacity) {}
   // Null when it is not there, or is there for another state of the file, or another side.
-  ThumbnailPointer Find(const ThumbnailWish& wish);
+  ThumbnailPointer Find(const ThumbnailRequest& request);
   // The thumbnail of a path in whatever state and size there is: something to show until the right one comes.
   ThumbnailPointer FindAny(const std::string& path) const;
-  void Put(const ThumbnailWish& wish, ThumbnailPointer thumbnail);
+  void Put(const ThumbnailRequest& request, ThumbnailPointer thumbnail);
   void Clear();
   uint64_t Bytes() const { return bytes_; }
   size_t Count() const { return entries_.size(); }
 
  private:
   struct Entry {
-    ThumbnailWish wish;
+    ThumbnailRequest request;
     ThumbnailPointer thumbnail;
   };
   const uint64_t capacity_;

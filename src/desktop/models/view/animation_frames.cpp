@@ -36,8 +36,8 @@ Status CopyFrame(const PictureRecord& facts, const Canvas& canvas, PicturePointe
 
 }  // namespace
 
-AnimationFrames::AnimationFrames(ViewWish wish, uint64_t capacity, std::function<void()> wake)
-    : capacity_(capacity), wake_(std::move(wake)), wish_(std::move(wish)), work_(Lane::Urgent, 1, [this] { return Next(); }) {
+AnimationFrames::AnimationFrames(ViewRequest request, uint64_t capacity, std::function<void()> wake)
+    : capacity_(capacity), wake_(std::move(wake)), request_(std::move(request)), work_(Lane::Urgent, 1, [this] { return Next(); }) {
   work_.Look();
 }
 
@@ -86,8 +86,8 @@ ViewPicturePointer AnimationFrames::Find(size_t frame) const {
 void AnimationFrames::Fit(int32_t width, int32_t height) {
   {
     const std::lock_guard lock(mutex_);
-    wish_.fitWidth = width;
-    wish_.fitHeight = height;
+    request_.fitWidth = width;
+    request_.fitHeight = height;
   }
   work_.Look();
 }
@@ -107,8 +107,8 @@ bool AnimationFrames::Keeps(size_t frame) const {
 }
 
 bool AnimationFrames::IsFitted(size_t frame) const {
-  const ViewWish& wish = frames_[frame]->wish;
-  return wish.fitWidth == wish_.fitWidth && wish.fitHeight == wish_.fitHeight;
+  const ViewRequest& request = frames_[frame]->request;
+  return request.fitWidth == request_.fitWidth && request.fitHeight == request_.fitHeight;
 }
 
 // What is to be decoded next: in the order of playing the first frame that is missing; then, where all are kept, the first one
@@ -127,15 +127,15 @@ bool AnimationFrames::NextFrame(size_t& frame) const {
 }
 
 Status AnimationFrames::OpenFile() {
-  RETURN_IF_BAD(LoadPictureInfo({.fileName = wish_.path, .options = wish_.read}, facts_));
+  RETURN_IF_BAD(LoadPictureInfo({.fileName = request_.path, .options = request_.read}, facts_));
   if (EstimateImageBytes(facts_->width, facts_->height, 32) > kMostCanvasBytes) return Status::MemoryAllocationError;
-  return OpenAnimation({.fileName = wish_.path, .options = wish_.read}, animation_);
+  return OpenAnimation({.fileName = request_.path, .options = request_.read}, animation_);
 }
 
 // Composes frames from `position_`, the next one of the animation, up to the wanted one. Null when it cannot be had; the frames
 // then end at `position_`.
 ViewPicturePointer AnimationFrames::Decode(size_t frame) {
-  ViewWish wish;
+  ViewRequest request;
   if (frame < position_) {
     animation_->Rewind();
     position_ = 0;
@@ -144,14 +144,14 @@ ViewPicturePointer AnimationFrames::Decode(size_t frame) {
   for (; position_ <= frame; ++position_) {
     status = animation_->Next();
     const std::lock_guard lock(mutex_);
-    wish = wish_;
+    request = request_;
     if (status != Status::Ok) failure_ = status;
     if (status != Status::Ok || stop_) return nullptr;
   }
   PicturePointer picture;
   status = CopyFrame(*facts_, animation_->Frame(), picture);
   auto view = std::make_shared<ViewPicture>();
-  view->wish = wish;
+  view->request = request;
   if (status == Status::Ok) status = PrepareView(std::move(picture), *view);
   if (status == Status::Ok) {
     view->picture->metadata = {};  // the same for each frame
@@ -163,7 +163,7 @@ ViewPicturePointer AnimationFrames::Decode(size_t frame) {
   return nullptr;
 }
 
-void AnimationFrames::Take(size_t frame, ViewPicturePointer picture) {
+void AnimationFrames::Keep(size_t frame, ViewPicturePointer picture) {
   frameBytes_ = std::max(frameBytes_, picture->Bytes());
   if (Keeps(frame) || frame == shown_) frames_[frame] = std::move(picture);
 }
@@ -178,7 +178,7 @@ LatestWork::Piece AnimationFrames::Next() {
 
 void AnimationFrames::Open() {
   const Status opened = Guarded([this] {
-    const FolderScope folder(wish_.path);
+    const FolderScope folder(request_.path);
     return OpenFile();
   });
   {
@@ -201,7 +201,7 @@ void AnimationFrames::MakeFrame(size_t frame) {
     const std::lock_guard lock(mutex_);
     if (status != Status::Ok) failure_ = status;
     if (picture != nullptr) {
-      Take(frame, std::move(picture));
+      Keep(frame, std::move(picture));
     } else if (!stop_) {  // what is behind cannot be reached either
       position_ = std::min(position_, frame);
       delaysMs_.resize(position_);

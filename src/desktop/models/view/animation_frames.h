@@ -17,7 +17,7 @@ namespace fotomill::desktop {
 class AnimationFrames {
  public:
   // `wake` is called on a thread of the pool whenever the file was opened, a frame came or one could not be decoded.
-  AnimationFrames(ViewWish wish, uint64_t capacity, std::function<void()> wake);
+  AnimationFrames(ViewRequest request, uint64_t capacity, std::function<void()> wake);
   ~AnimationFrames();
   AnimationFrames(const AnimationFrames&) = delete;
   AnimationFrames& operator=(const AnimationFrames&) = delete;
@@ -45,13 +45,13 @@ class AnimationFrames {
   bool Keeps(size_t frame) const;
   bool IsFitted(size_t frame) const;
   ViewPicturePointer Decode(size_t frame);
-  void Take(size_t frame, ViewPicturePointer picture);
+  void Keep(size_t frame, ViewPicturePointer picture);
   size_t Room() const;
 
   const uint64_t capacity_;
   const std::function<void()> wake_;
   mutable std::mutex mutex_;
-  ViewWish wish_;
+  ViewRequest request_;
   std::vector<int32_t> delaysMs_;
   int32_t rounds_ = 1;
   Status failure_ = Status::Ok;

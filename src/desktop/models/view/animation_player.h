@@ -12,8 +12,8 @@ namespace fotomill::desktop {
 class AnimationPlayer {
  public:
   // `wake` as of AnimationFrames: At is to be asked again.
-  AnimationPlayer(ViewWish wish, uint64_t capacity, std::function<void()> wake)
-      : frames_(std::move(wish), capacity, std::move(wake)) {}
+  AnimationPlayer(ViewRequest request, uint64_t capacity, std::function<void()> wake)
+      : frames_(std::move(request), capacity, std::move(wake)) {}
 
   // Goes on from the frame that is shown; once the last round has ended, from the first one.
   void Play();

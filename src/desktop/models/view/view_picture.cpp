@@ -44,12 +44,12 @@ const ColorTransform& TransformOf(const std::vector<uint8_t>& profile) {
   return *transform;
 }
 
-Status LoadInto(const ViewWish& wish, ViewPicture& view) {
+Status LoadInto(const ViewRequest& request, ViewPicture& view) {
   PicturePointer picture;
-  ReadRequest request{.fileName = wish.path, .options = wish.read};
-  RETURN_IF_BAD(LoadPictureInfo(request, picture));
-  request.page = wish.page;
-  RETURN_IF_BAD(ReadPicture(request, *picture));
+  ReadRequest read{.fileName = request.path, .options = request.read};
+  RETURN_IF_BAD(LoadPictureInfo(read, picture));
+  read.page = request.page;
+  RETURN_IF_BAD(ReadPicture(read, *picture));
   return PrepareView(std::move(picture), view);
 }
 
@@ -67,11 +67,11 @@ uint64_t ViewPicture::Bytes() const {
 }
 
 Status PrepareView(PicturePointer picture, ViewPicture& view) {
-  const ViewWish& wish = view.wish;
+  const ViewRequest& request = view.request;
   // Before the background joins in, whose color is the screen's.
   const bool profiles = !picture->metadata.icc.empty() || !screenProfile.empty();
-  if (wish.look.profiles && profiles) TransformOf(picture->metadata.icc).Apply(picture->image);
-  if (wish.look.keepAlpha) {
+  if (request.look.profiles && profiles) TransformOf(picture->metadata.icc).Apply(picture->image);
+  if (request.look.keepAlpha) {
     RETURN_IF_BAD(PrepareWithAlpha(*picture));
   } else {
     RETURN_IF_BAD(PrepareForDisplay(*picture, static_cast<Color>(settings.ViewModeBackground)));
@@ -79,8 +79,8 @@ Status PrepareView(PicturePointer picture, ViewPicture& view) {
   view.photo = PhotoFacts(picture->metadata.exif);
   ViewTransform fit;
   fit.SetPicture(picture->image.Width(), picture->image.Height());
-  fit.SetWindow(wish.fitWidth, wish.fitHeight);
-  if (wish.fitWidth > 0 && fit.Scale() < 1) {
+  fit.SetWindow(request.fitWidth, request.fitHeight);
+  if (request.fitWidth > 0 && fit.Scale() < 1) {
     RETURN_IF_BAD(Shrink(*picture, fit.ShownWidth(), fit.ShownHeight(), view.fitted));
   }
   view.picture = std::move(picture);
@@ -93,27 +93,27 @@ std::string SizeAndZoom(const PictureRecord& picture, double scale) {
 }
 
 bool ViewPicture::HasChanged() const {
-  const platform::FileFacts now = platform::FactsOf(wish.path);
+  const platform::FileFacts now = platform::FactsOf(request.path);
   return now.identity != facts.identity || now.device != facts.device || now.size != facts.size || now.modified != facts.modified;
 }
 
 Status PixelsForOthers(const ViewPicture& view, Color background, RgbImage& pixels) {
   RETURN_IF_BAD(ToRgb(view.picture->image, view.picture->alpha, background, pixels));
-  if (!view.wish.look.profiles || screenProfile.empty()) return Status::Ok;
+  if (!view.request.look.profiles || screenProfile.empty()) return Status::Ok;
   PackedImage image;
   RETURN_IF_BAD(ToPacked(pixels, image));
   ColorTransform(screenProfile).Apply(image);
   return ToRgb(image, pixels);
 }
 
-ViewPicturePointer LoadViewPicture(const ViewWish& wish) {
+ViewPicturePointer LoadViewPicture(const ViewRequest& request) {
   const double start = platform::MonotonicSeconds();
   auto view = std::make_shared<ViewPicture>();
-  view->wish = wish;
+  view->request = request;
   view->status = Guarded([&] {
-    const FolderScope folder(wish.path);
-    view->facts = platform::FactsOf(wish.path);
-    return LoadInto(wish, *view);
+    const FolderScope folder(request.path);
+    view->facts = platform::FactsOf(request.path);
+    return LoadInto(request, *view);
   });
   view->seconds = platform::MonotonicSeconds() - start;
   return view;
@@ -122,10 +122,10 @@ ViewPicturePointer LoadViewPicture(const ViewWish& wish) {
 ViewPicturePointer TurnedView(const ViewPicture& view, Orientation turn) {
   const PictureRecord& old = *view.picture;
   auto turned = std::make_shared<ViewPicture>();
-  turned->wish = view.wish;
+  turned->request = view.request;
   turned->facts = view.facts;
   turned->photo = view.photo;
-  turned->picture = NewPictureRecord(view.wish.read.alphaBackground);
+  turned->picture = NewPictureRecord(view.request.read.alphaBackground);
   if (turned->picture == nullptr) return nullptr;
   PictureRecord& picture = *turned->picture;
   if (OrientImage(old.image, turn, picture.image) != Status::Ok) return nullptr;
@@ -146,37 +146,37 @@ ViewPicturePointer TurnedView(const ViewPicture& view, Orientation turn) {
 ViewLoader::ViewLoader(uint64_t capacity, std::function<void()> wake)
     : capacity_(capacity), wake_(std::move(wake)), work_(Lane::Urgent, 1, [this] { return Next(); }) {}
 
-void ViewLoader::Want(std::vector<ViewWish> wishes) {
+void ViewLoader::Want(std::vector<ViewRequest> requests) {
   {
     const std::lock_guard lock(mutex_);
-    wishes_ = std::move(wishes);
+    requests_ = std::move(requests);
     full_ = false;
     DropUnwanted();
   }
   work_.Look();
 }
 
-ViewPicturePointer ViewLoader::Find(const ViewWish& wish) const {
+ViewPicturePointer ViewLoader::Find(const ViewRequest& request) const {
   const std::lock_guard lock(mutex_);
   for (const ViewPicturePointer& picture : pictures_) {
-    if (picture->wish.SamePicture(wish)) return picture;
+    if (picture->request.SamePicture(request)) return picture;
   }
   return nullptr;
 }
 
 void ViewLoader::Forget(const std::string& path) {
   const std::lock_guard lock(mutex_);
-  std::erase_if(pictures_, [&](const ViewPicturePointer& picture) { return picture->wish.path == path; });
+  std::erase_if(pictures_, [&](const ViewPicturePointer& picture) { return picture->request.path == path; });
 }
 
-// The most urgent wish that has no picture yet and may still have one.
-bool ViewLoader::NextWish(ViewWish& wish) {
+// The most urgent request that has no picture yet and may still have one.
+bool ViewLoader::NextRequest(ViewRequest& request) {
   if (full_) return false;
-  for (const ViewWish& candidate : wishes_) {
+  for (const ViewRequest& candidate : requests_) {
     const bool there = std::any_of(pictures_.begin(), pictures_.end(),
-                                   [&](const ViewPicturePointer& picture) { return picture->wish.SamePicture(candidate); });
+                                   [&](const ViewPicturePointer& picture) { return picture->request.SamePicture(candidate); });
     if (there) continue;
-    wish = candidate;
+    request = candidate;
     return true;
   }
   return false;
@@ -186,9 +186,9 @@ bool ViewLoader::NextWish(ViewWish& wish) {
 void ViewLoader::DropUnwanted() {
   std::vector<ViewPicturePointer> kept;
   uint64_t bytes = 0;
-  for (const ViewWish& wish : wishes_) {
+  for (const ViewRequest& request : requests_) {
     for (const ViewPicturePointer& picture : pictures_) {
-      if (!picture->wish.SamePicture(wish)) continue;
+      if (!picture->request.SamePicture(request)) continue;
       if (!kept.empty() && bytes + picture->Bytes() > capacity_) {
         full_ = true;
         continue;
@@ -202,13 +202,13 @@ void ViewLoader::DropUnwanted() {
 
 LatestWork::Piece ViewLoader::Next() {
   const std::lock_guard lock(mutex_);
-  ViewWish wish;
-  if (!NextWish(wish)) return {};
-  return [this, wish = std::move(wish)] { Decode(wish); };
+  ViewRequest request;
+  if (!NextRequest(request)) return {};
+  return [this, request = std::move(request)] { Decode(request); };
 }
 
-void ViewLoader::Decode(const ViewWish& wish) {
-  ViewPicturePointer picture = LoadViewPicture(wish);
+void ViewLoader::Decode(const ViewRequest& request) {
+  ViewPicturePointer picture = LoadViewPicture(request);
   {
     const std::lock_guard lock(mutex_);
     pictures_.push_back(std::move(picture));
@@ -230,7 +230,7 @@ void ViewScaler::Request(ViewPicturePointer picture, int32_t width, int32_t heig
   work_.Look();
 }
 
-std::unique_ptr<ViewScaler::Scaled> ViewScaler::Take() {
+std::unique_ptr<ViewScaler::Scaled> ViewScaler::Fetch() {
   const std::lock_guard lock(mutex_);
   return std::move(finished_);
 }

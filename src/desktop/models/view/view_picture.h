@@ -28,11 +28,11 @@ struct ViewLook {
 };
 
 // The color profile of the screen that pictures are made for from here on; empty for sRGB. To be told before the first picture
-// is wished for.
+// is asked for.
 void SetScreenProfile(std::vector<uint8_t> profile);
 
 // A picture as a view window wants it: a page of a file, with the size of the window that it is to fit.
-struct ViewWish {
+struct ViewRequest {
   std::string path;
   int32_t page = 0;
   int32_t fitWidth = 0, fitHeight = 0;  // device pixels, 0 for none
@@ -40,7 +40,7 @@ struct ViewWish {
   ReadOptions read = ReadOptionsFromSettings();
 
   // Whether both mean the same pixels, whatever window they are to fit.
-  bool SamePicture(const ViewWish& other) const { return path == other.path && page == other.page && look == other.look; }
+  bool SamePicture(const ViewRequest& other) const { return path == other.path && page == other.page && look == other.look; }
 };
 
 // Pixels of 24 bits with their alpha plane, which is empty where all are opaque.
@@ -50,11 +50,11 @@ struct ViewPixels {
 
 // A decoded picture: upright, 24 bits, with an alpha plane only if its look wants it and not all of it is opaque.
 struct ViewPicture {
-  ViewWish wish;
+  ViewRequest request;
   platform::FileFacts facts;  // of the file, as it was read
   Status status = Status::Ok;
   PicturePointer picture;          // null unless Ok
-  ViewPixels fitted;               // as large as the fit of the wish's window; empty where that is the picture's own size or more
+  ViewPixels fitted;               // as large as the fit of the request's window; empty where that is the picture's own size or more
   std::vector<std::string> photo;  // what the camera wrote about it, in lines
   double seconds = 0;              // that decoding took
 
@@ -72,9 +72,9 @@ std::string SizeAndZoom(const PictureRecord& picture, double scale);
 // A decoded picture's pixels for other programs: on a background, 0x00BBGGRR, and in sRGB whatever the screen's colors are.
 Status PixelsForOthers(const ViewPicture& view, Color background, RgbImage& pixels);
 
-// Makes a decoded picture what the wish of `view` asks for. Statuses of PrepareForDisplay.
+// Makes a decoded picture what the request of `view` asks for. Statuses of PrepareForDisplay.
 Status PrepareView(PicturePointer picture, ViewPicture& view);
-ViewPicturePointer LoadViewPicture(const ViewWish& wish);
+ViewPicturePointer LoadViewPicture(const ViewRequest& request);
 // A turned copy of a picture that was loaded; null where there is no memory for it.
 ViewPicturePointer TurnedView(const ViewPicture& view, Orientation turn);
 
@@ -89,22 +89,22 @@ class ViewLoader {
 
   // What is wanted from here on, most urgent first. Pictures that are not among these are given back; what does not fit
   // into the capacity beside more urgent ones is not decoded, the first one always is.
-  void Want(std::vector<ViewWish> wishes);
-  // The picture of a wish if it is there, whatever window it was fitted to.
-  ViewPicturePointer Find(const ViewWish& wish) const;
+  void Want(std::vector<ViewRequest> requests);
+  // The picture of a request if it is there, whatever window it was fitted to.
+  ViewPicturePointer Find(const ViewRequest& request) const;
   // Forgets a picture whose file has changed.
   void Forget(const std::string& path);
 
  private:
   LatestWork::Piece Next();
-  void Decode(const ViewWish& wish);
-  bool NextWish(ViewWish& wish);
+  void Decode(const ViewRequest& request);
+  bool NextRequest(ViewRequest& request);
   void DropUnwanted();
 
   const uint64_t capacity_;
   const std::function<void()> wake_;
   mutable std::mutex mutex_;
-  std::vector<ViewWish> wishes_;
+  std::vector<ViewRequest> requests_;
   std::vector<ViewPicturePointer> pictures_;
   bool full_ = false;
   LatestWork work_;  // last: it uses the rest
@@ -125,7 +125,7 @@ class ViewScaler {
     ViewPixels pixels;
   };
   // What was finished since the last call, null if nothing.
-  std::unique_ptr<Scaled> Take();
+  std::unique_ptr<Scaled> Fetch();
 
  private:
   LatestWork::Piece Next();

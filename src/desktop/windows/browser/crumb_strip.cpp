@@ -94,8 +94,8 @@ void CrumbStrip::LayOut() {
 }
 
 void CrumbStrip::ListBelow(size_t place) {
-  listing_.Start([this, place, folder = places_[place].crumb.folder](const StopToken&, const LooseWork::Tell& tell) {
-    tell([this, place, names = SubfolderNames(folder)] { OfferBelow(place, names); });
+  listing_.Start([this, place, folder = places_[place].crumb.folder](const StopToken&, const LooseWork::Report& report) {
+    report([this, place, names = SubfolderNames(folder)] { OfferBelow(place, names); });
   });
 }
 

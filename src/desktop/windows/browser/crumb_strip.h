@@ -7,7 +7,7 @@
 #include <vector>
 
 #include "desktop/models/browser/path_crumbs.h"
-#include "desktop/windows/shell/loose_work.h"
+#include "desktop/windows/widgets/loose_work.h"
 
 class wxButton;
 

@@ -10,9 +10,9 @@ constexpr size_t kBunch = 200;
 
 void FolderReader::List(const std::string& folder, bool namesFirst) {
   facts_.Stop();
-  listing_.Start([this, folder, namesFirst](const StopToken& stop, const LooseWork::Tell& tell) {
+  listing_.Start([this, folder, namesFirst](const StopToken& stop, const LooseWork::Report& report) {
     const auto send = [&](FolderListing listing, bool complete) {
-      tell([this, listing = std::move(listing), complete]() mutable {
+      report([this, listing = std::move(listing), complete]() mutable {
         if (complete) listing_.Stop();
         events_.listed(std::move(listing), complete);
       });
@@ -28,9 +28,9 @@ void FolderReader::List(const std::string& folder, bool namesFirst) {
 }
 
 void FolderReader::ReadFacts(const std::string& folder, PlacedItems wanted) {
-  facts_.Start([this, folder, wanted = std::move(wanted)](const StopToken& stop, const LooseWork::Tell& tell) {
+  facts_.Start([this, folder, wanted = std::move(wanted)](const StopToken& stop, const LooseWork::Report& report) {
     const auto send = [&](PlacedItems found, bool last) {
-      tell([this, found = std::move(found), last] {
+      report([this, found = std::move(found), last] {
         if (last) facts_.Stop();
         events_.factsFound(found, last);
       });

@@ -34,8 +34,8 @@ void HoverTip::Over(const std::string& folder, const FolderItem* item, Status kn
 }
 
 void HoverTip::Read() {
-  reading_.Start([this, folder = folder_, item = item_, known = known_](const StopToken&, const LooseWork::Tell& tell) {
-    tell([this, lines = FileTipLines(folder, item, known)] {
+  reading_.Start([this, folder = folder_, item = item_, known = known_](const StopToken&, const LooseWork::Report& report) {
+    report([this, lines = FileTipLines(folder, item, known)] {
       wxString text;
       for (const std::string& line : lines) text += (text.empty() ? "" : "\n") + Shown(line);
       window_.SetToolTip(text);

@@ -6,7 +6,7 @@
 
 #include "core/status.h"
 #include "desktop/models/browser/folder_listing.h"
-#include "desktop/windows/shell/loose_work.h"
+#include "desktop/windows/widgets/loose_work.h"
 
 class wxWindow;
 

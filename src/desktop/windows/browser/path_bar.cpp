@@ -106,8 +106,8 @@ void PathBar::ReadNames() {
   if (above.empty() || above == namesOf_) return CallAfter([this] { CompleteTyped(); });
   namesOf_ = above;
   names_.clear();
-  reading_.Start([this, above](const StopToken&, const LooseWork::Tell& tell) {
-    tell([this, names = SubfolderNames(FolderTyped(above))] {
+  reading_.Start([this, above](const StopToken&, const LooseWork::Report& report) {
+    report([this, names = SubfolderNames(FolderTyped(above))] {
       names_ = names;
       LogEvent("completions", std::to_string(names.size()));
       CompleteTyped();

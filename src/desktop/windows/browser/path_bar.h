@@ -6,7 +6,7 @@
 #include <string>
 #include <vector>
 
-#include "desktop/windows/shell/loose_work.h"
+#include "desktop/windows/widgets/loose_work.h"
 
 class wxBitmapButton;
 class wxBoxSizer;

@@ -102,54 +102,54 @@ void ThumbnailCanvas::UpdateScrollbar() {
   SetScrollbar(wxVERTICAL, static_cast<int>(scroll_), GetClientSize().y, static_cast<int>(layout_.TotalHeight()));
 }
 
-ThumbnailWish ThumbnailCanvas::WishOf(size_t line) const {
+ThumbnailRequest ThumbnailCanvas::RequestOf(size_t line) const {
   const FolderItem& item = model_.Line(line);
-  ThumbnailWish wish;
-  wish.path = model_.PathOfLine(line);
-  wish.modified = item.modified;
-  wish.size = item.size;
-  wish.side = static_cast<int32_t>(std::lround(square_ * GetContentScaleFactor()));
-  wish.mode = model_.Modes().thumbnails;
-  wish.options = ThumbnailOptionsFromSettings();
-  return wish;
+  ThumbnailRequest request;
+  request.path = model_.PathOfLine(line);
+  request.modified = item.modified;
+  request.size = item.size;
+  request.side = static_cast<int32_t>(std::lround(square_ * GetContentScaleFactor()));
+  request.mode = model_.Modes().thumbnails;
+  request.options = ThumbnailOptionsFromSettings();
+  return request;
 }
 
 // Stand-ins for what is visible first, then the thumbnails themselves, then a screen ahead in the direction of scrolling, then
 // the rest from there on, if it is to be made before anybody looks at it.
 void ThumbnailCanvas::WantThumbnails() {
-  std::vector<ThumbnailWish> wishes;
+  std::vector<ThumbnailRequest> requests;
   const auto want = [&](size_t first, size_t end) {
     for (size_t line = first; line < end; ++line) {
       const FolderItem& item = model_.Line(line);
       if (item.folder || item.modified == 0) continue;  // its time is not known yet
-      ThumbnailWish wish = WishOf(line);
-      if (thumbnails_.Find(wish) == nullptr) wishes.push_back(std::move(wish));
+      ThumbnailRequest request = RequestOf(line);
+      if (thumbnails_.Find(request) == nullptr) requests.push_back(std::move(request));
     }
   };
   if (square_ > 0 && model_.LineCount() > 0) {
     const int height = GetClientSize().y;
     const CellLayout::Range visible = layout_.Visible(scroll_);
     want(visible.first, visible.end);
-    const std::vector<ThumbnailWish> standIns = StandInsFor(visible);
+    const std::vector<ThumbnailRequest> standIns = StandInsFor(visible);
     const int64_t ahead = direction_ > 0 ? scroll_ + height : std::max<int64_t>(scroll_ - height, 0);
     const CellLayout::Range next = layout_.LinesBetween(ahead, ahead + height);
     if (direction_ > 0) want(std::max(next.first, visible.end), next.end);
     if (direction_ < 0) want(next.first, std::min(next.end, visible.first));
     if (settings.BrowserThumbnailPrecacheEnable != 0) {
-      for (size_t line = visible.end; line < model_.LineCount() && wishes.size() < kPrecache; ++line) want(line, line + 1);
+      for (size_t line = visible.end; line < model_.LineCount() && requests.size() < kPrecache; ++line) want(line, line + 1);
     }
-    wishes.insert(wishes.begin(), standIns.begin(), standIns.end());
+    requests.insert(requests.begin(), standIns.begin(), standIns.end());
   }
-  thumbnails_.Want(std::move(wishes));
+  thumbnails_.Want(std::move(requests));
 }
 
-std::vector<ThumbnailWish> ThumbnailCanvas::StandInsFor(const CellLayout::Range& lines) const {
-  std::vector<ThumbnailWish> standIns;
+std::vector<ThumbnailRequest> ThumbnailCanvas::StandInsFor(const CellLayout::Range& lines) const {
+  std::vector<ThumbnailRequest> standIns;
   for (size_t line = lines.first; line < lines.end; ++line) {
     const FolderItem& item = model_.Line(line);
     if (item.folder || item.modified == 0 || !MayHoldThumbnail(item.format)) continue;
     if (thumbnails_.FindAny(model_.PathOfLine(line)) != nullptr) continue;
-    standIns.push_back(WishOf(line));
+    standIns.push_back(RequestOf(line));
     standIns.back().standIn = true;
   }
   return standIns;
@@ -163,7 +163,7 @@ void ThumbnailCanvas::ThumbnailsCame(const std::vector<ThumbnailLoader::Result>&
     visible.insert(model_.PathOfLine(line));
     if (!model_.Line(line).folder && thumbnails_.FindAny(model_.PathOfLine(line)) == nullptr) ++empty;
   }
-  const auto shows = [&](const ThumbnailLoader::Result& result) { return visible.contains(result.wish.path); };
+  const auto shows = [&](const ThumbnailLoader::Result& result) { return visible.contains(result.request.path); };
   if (std::any_of(results.begin(), results.end(), shows)) Refresh();
   if (empty == 0 && filled_ != model_.Folder()) LogEvent("filled", std::to_string(visible.size()));
   if (empty == 0) filled_ = model_.Folder();
@@ -174,7 +174,7 @@ size_t ThumbnailCanvas::MissingThumbnails() {
   size_t missing = 0;
   const CellLayout::Range visible = layout_.Visible(scroll_);
   for (size_t line = visible.first; line < visible.end && square_ > 0; ++line) {
-    if (!model_.Line(line).folder && thumbnails_.Find(WishOf(line)) == nullptr) ++missing;
+    if (!model_.Line(line).folder && thumbnails_.Find(RequestOf(line)) == nullptr) ++missing;
   }
   return missing;
 }

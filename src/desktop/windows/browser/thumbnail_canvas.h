@@ -69,8 +69,8 @@ class ThumbnailCanvas : public wxWindow {
   void DrawPlaceholder(wxDC& dc, const FolderItem& item, const wxRect& square, const wxString& mark, const Looks& looks);
   wxString CutName(wxDC& dc, const std::string& name, int width);
   const wxBitmap& BitmapOfThumbnail(const ThumbnailPointer& thumbnail);
-  ThumbnailWish WishOf(size_t line) const;
-  std::vector<ThumbnailWish> StandInsFor(const CellLayout::Range& lines) const;
+  ThumbnailRequest RequestOf(size_t line) const;
+  std::vector<ThumbnailRequest> StandInsFor(const CellLayout::Range& lines) const;
   size_t LineAt(const wxPoint& point) const;
   void MoveFocus(Step step, const wxKeyEvent& event);
   void ReportFocus();

@@ -106,10 +106,10 @@ void ThumbnailCanvas::DrawCell(wxDC& dc, size_t line, const Looks& looks) {
 void ThumbnailCanvas::DrawPicture(wxDC& dc, size_t line, const wxRect& square, const Looks& looks) {
   const FolderItem& item = model_.Line(line);
   if (item.folder) return DrawPlaceholder(dc, item, square, {}, looks);
-  const ThumbnailWish wish = WishOf(line);
-  ThumbnailPointer thumbnail = thumbnails_.Find(wish);
+  const ThumbnailRequest request = RequestOf(line);
+  ThumbnailPointer thumbnail = thumbnails_.Find(request);
   const bool right = thumbnail != nullptr;
-  if (!right) thumbnail = thumbnails_.FindAny(wish.path);
+  if (!right) thumbnail = thumbnails_.FindAny(request.path);
   if (thumbnail == nullptr || thumbnail->status != Status::Ok) {
     return DrawPlaceholder(dc, item, square, thumbnail == nullptr ? wxString() : wxString("!"), looks);
   }

@@ -19,19 +19,19 @@ class ThumbnailService : public wxEvtHandler {
   ThumbnailService();
   ~ThumbnailService() override;
 
-  // The thumbnail that serves a wish, and any that is there of a file, whatever its size and age;
+  // The thumbnail that serves a request, and any that is there of a file, whatever its size and age;
   // null if there is none in the cache.
-  ThumbnailPointer Find(const ThumbnailWish& wish) { return cache_.Find(wish); }
+  ThumbnailPointer Find(const ThumbnailRequest& request) { return cache_.Find(request); }
   ThumbnailPointer FindAny(const std::string& path) const { return cache_.FindAny(path); }
-  // Replaces all wishes; only one browser is in front.
-  void Want(std::vector<ThumbnailWish> wishes) { loader_->Want(std::move(wishes)); }
+  // Replaces all requests; only one browser is in front.
+  void Want(std::vector<ThumbnailRequest> requests) { loader_->Want(std::move(requests)); }
   void SetListener(Listener listener) { listener_ = std::move(listener); }
   void Clear() { cache_.Clear(); }
   size_t Pending() const { return loader_->Pending(); }
   uint64_t Bytes() const { return cache_.Bytes(); }
 
  private:
-  void TakeResults();
+  void FetchResults();
 
   ThumbnailCache cache_;
   Listener listener_;

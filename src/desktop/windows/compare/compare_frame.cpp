@@ -144,21 +144,21 @@ size_t CompareFrame::PaneOf(const ViewCanvas* canvas) const {
 
 // --- pictures ---
 
-ViewWish CompareFrame::WishOf(const Pane& pane) const {
+ViewRequest CompareFrame::RequestOf(const Pane& pane) const {
   const wxSize size = pane.canvas->DeviceSize();
   return {pane.path, 0, size.x, size.y};
 }
 
 void CompareFrame::WantPictures() {
   if (loader_ == nullptr) return;
-  std::vector<ViewWish> wishes;
-  for (const Pane& pane : panes_) wishes.push_back(WishOf(pane));
-  loader_->Want(std::move(wishes));
+  std::vector<ViewRequest> requests;
+  for (const Pane& pane : panes_) requests.push_back(RequestOf(pane));
+  loader_->Want(std::move(requests));
 }
 
 void CompareFrame::PicturesCame() {
   for (Pane& pane : panes_) {
-    const ViewPicturePointer ready = loader_->Find(WishOf(pane));
+    const ViewPicturePointer ready = loader_->Find(RequestOf(pane));
     if (ready != nullptr && ready != pane.canvas->Picture()) ShowPicture(pane, ready);
   }
 }

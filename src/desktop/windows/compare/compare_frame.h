@@ -54,7 +54,7 @@ class CompareFrame : public wxFrame {
   void Placed(const ViewCanvas* canvas);
   void Focused(size_t pane);
   void ShowFacts(const ViewCanvas* canvas);
-  ViewWish WishOf(const Pane& pane) const;
+  ViewRequest RequestOf(const Pane& pane) const;
   void OnKey(wxKeyEvent& event);
 
   Shell& shell_;

@@ -8,7 +8,7 @@
 #include <vector>
 
 #include "desktop/models/thumbnails/upkeep.h"
-#include "desktop/windows/shell/background.h"
+#include "desktop/windows/widgets/background.h"
 
 class wxCheckBox;
 class wxGauge;

@@ -33,21 +33,21 @@ wxBitmapBundle OnSquare(const RgbImage& pixels, int side, double scale) {
 }  // namespace
 
 HistoryThumbnails::HistoryThumbnails(std::function<void(const std::vector<std::string>&)> came)
-    : came_(std::move(came)), loader_(1, [this] { CallAfter([this] { Take(); }); }) {}
+    : came_(std::move(came)), loader_(1, [this] { CallAfter([this] { FetchResults(); }); }) {}
 
 void HistoryThumbnails::Want(const std::vector<std::string>& paths, int side, double scale) {
   if (side != side_) bitmaps_.clear();
   side_ = side;
   scale_ = scale;
   empty_ = side == 0 ? wxBitmapBundle() : OnSquare({}, side, scale);
-  std::vector<ThumbnailWish> wishes;
+  std::vector<ThumbnailRequest> requests;
   for (const std::string& path : paths) {
     if (side == 0 || bitmaps_.contains(path) || !GetsThumbnail(path)) continue;
     const platform::FileFacts facts = platform::FactsOf(path);
     if (facts.kind != platform::FileKind::Regular) continue;
-    wishes.push_back({path, facts.modified, facts.size, side, choice::kDiskBased, false, ThumbnailOptionsFromSettings()});
+    requests.push_back({path, facts.modified, facts.size, side, choice::kDiskBased, false, ThumbnailOptionsFromSettings()});
   }
-  loader_.Want(std::move(wishes));
+  loader_.Want(std::move(requests));
 }
 
 const wxBitmapBundle& HistoryThumbnails::Find(const std::string& path) const {
@@ -55,12 +55,12 @@ const wxBitmapBundle& HistoryThumbnails::Find(const std::string& path) const {
   return found == bitmaps_.end() ? empty_ : found->second;
 }
 
-void HistoryThumbnails::Take() {
+void HistoryThumbnails::FetchResults() {
   std::vector<std::string> paths;
-  for (const ThumbnailLoader::Result& result : loader_.TakeResults()) {
-    if (result.wish.side != side_ || result.thumbnail == nullptr || result.thumbnail->pixels.Empty()) continue;
-    bitmaps_[result.wish.path] = OnSquare(result.thumbnail->pixels, side_, scale_);
-    paths.push_back(result.wish.path);
+  for (const ThumbnailLoader::Result& result : loader_.FetchResults()) {
+    if (result.request.side != side_ || result.thumbnail == nullptr || result.thumbnail->pixels.Empty()) continue;
+    bitmaps_[result.request.path] = OnSquare(result.thumbnail->pixels, side_, scale_);
+    paths.push_back(result.request.path);
   }
   if (!paths.empty()) came_(paths);
 }

@@ -24,7 +24,7 @@ class HistoryThumbnails : public wxEvtHandler {
   const wxBitmapBundle& Find(const std::string& path) const;
 
  private:
-  void Take();
+  void FetchResults();
 
   const std::function<void(const std::vector<std::string>&)> came_;
   std::unordered_map<std::string, wxBitmapBundle> bitmaps_;

@@ -5,7 +5,7 @@
 #include <string>
 
 #include "desktop/models/info/exif_report.h"
-#include "desktop/windows/shell/background.h"
+#include "desktop/windows/widgets/background.h"
 
 class wxDataViewListCtrl;
 class wxStaticBitmap;

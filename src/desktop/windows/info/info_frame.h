@@ -8,7 +8,7 @@
 #include <vector>
 
 #include "desktop/models/info/info_report.h"
-#include "desktop/windows/shell/background.h"
+#include "desktop/windows/widgets/background.h"
 
 class wxListBox;
 class wxSizer;

@@ -139,7 +139,7 @@ class App : public wxApp {
   }
 
   void TakeOver(platform::LaterStart& start) {
-    if (frame_ == nullptr || !start.Take()) return;
+    if (frame_ == nullptr || !start.Accept()) return;
     LogEvent("taken-over", start.Message());
     if (frame_->IsIconized()) frame_->Iconize(false);
     frame_->Raise();

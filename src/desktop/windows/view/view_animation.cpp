@@ -19,7 +19,7 @@ namespace {
 constexpr uint64_t kFrameBytes = 256ull * 1024 * 1024;  // of frames that are kept
 
 bool IsAnimation(const ViewPicturePointer& picture) {
-  return picture->picture != nullptr && picture->picture->pageCount > 1 && picture->wish.page == 0 &&
+  return picture->picture != nullptr && picture->picture->pageCount > 1 && picture->request.page == 0 &&
          FormatRow(picture->picture->formatIndex).animate != nullptr;
 }
 
@@ -35,11 +35,11 @@ void ViewAnimation::Begin(const ViewPicturePointer& picture) {
   hasBar_ = IsAnimation(picture);
   PlaceBar();
   if (!hasBar_) return;
-  ViewWish wish = picture->wish;
-  wish.fitWidth = canvas_.DeviceSize().x;
-  wish.fitHeight = canvas_.DeviceSize().y;
+  ViewRequest request = picture->request;
+  request.fitWidth = canvas_.DeviceSize().x;
+  request.fitHeight = canvas_.DeviceSize().y;
   alive_ = std::make_shared<std::atomic<bool>>(true);
-  player_ = std::make_unique<AnimationPlayer>(std::move(wish), kFrameBytes, [this, alive = alive_] {
+  player_ = std::make_unique<AnimationPlayer>(std::move(request), kFrameBytes, [this, alive = alive_] {
     if (!*alive) return;
     wxTheApp->CallAfter([this, alive] {
       if (*alive) Tick();

@@ -146,7 +146,7 @@ void ViewCanvas::TransformChanged() {
 }
 
 void ViewCanvas::ScaledCame() {
-  std::unique_ptr<ViewScaler::Scaled> scaled = scaler_->Take();
+  std::unique_ptr<ViewScaler::Scaled> scaled = scaler_->Fetch();
   if (scaled == nullptr || scaled->picture != picture_) return;
   scaled_ = std::move(scaled);
   Refresh();
@@ -213,7 +213,7 @@ void ViewCanvas::PaintMessage(wxDC& dc) const {
   if (picture_ == nullptr) return;
   const Shade text = Readable({0, 0, 0}, {around.Red(), around.Green(), around.Blue()});
   dc.SetTextForeground(wxColour(text.red, text.green, text.blue));
-  const std::string name(platform::FileNameOf(picture_->wish.path));
+  const std::string name(platform::FileNameOf(picture_->request.path));
   dc.DrawLabel(Shown(name) + "\n" + Shown(Tr(StatusMessage(picture_->status))), wxRect(GetClientSize()), wxALIGN_CENTER);
 }
 

@@ -88,7 +88,7 @@ ViewFrame::~ViewFrame() {
 
 // --- which picture ---
 
-ViewWish ViewFrame::WishOf(size_t place) const {
+ViewRequest ViewFrame::RequestOf(size_t place) const {
   const wxSize size = canvas_->DeviceSize();
   return {list_[place], place == place_ ? page_ : 0, size.x, size.y};
 }
@@ -145,7 +145,7 @@ bool ViewFrame::AskForPicture() {
   animation_->End();
   keyTime_ = platform::MonotonicSeconds();
   WantPictures();
-  ViewPicturePointer ready = loader_->Find(WishOf(place_));
+  ViewPicturePointer ready = loader_->Find(RequestOf(place_));
   if (ready != nullptr && ready->HasChanged()) {
     loader_->Forget(list_[place_]);
     WantPictures();
@@ -171,11 +171,11 @@ void ViewFrame::ShowStandIn() {
 // The picture itself, then what the slideshow goes to, then two each way.
 void ViewFrame::WantPictures() {
   if (loader_ == nullptr || canvas_ == nullptr) return;
-  std::vector<ViewWish> wishes;
+  std::vector<ViewRequest> requests;
   const auto want = [&](size_t place) {
-    ViewWish wish = WishOf(place);
-    const auto same = [&](const ViewWish& other) { return other.SamePicture(wish); };
-    if (std::none_of(wishes.begin(), wishes.end(), same)) wishes.push_back(std::move(wish));
+    ViewRequest request = RequestOf(place);
+    const auto same = [&](const ViewRequest& other) { return other.SamePicture(request); };
+    if (std::none_of(requests.begin(), requests.end(), same)) requests.push_back(std::move(request));
   };
   want(place_);
   if (const auto upcoming = slideshow_.Upcoming(); upcoming && *upcoming < list_.size()) want(*upcoming);
@@ -183,12 +183,12 @@ void ViewFrame::WantPictures() {
   for (const int64_t step : {1, -1, 2, -2}) {
     want(static_cast<size_t>(((static_cast<int64_t>(place_) + step) % count + count) % count));
   }
-  loader_->Want(std::move(wishes));
+  loader_->Want(std::move(requests));
 }
 
 void ViewFrame::PictureCame() {
   if (IsCurrent(loaded_)) return;
-  if (const ViewPicturePointer ready = loader_->Find(WishOf(place_))) ShowPicture(ready);
+  if (const ViewPicturePointer ready = loader_->Find(RequestOf(place_))) ShowPicture(ready);
 }
 
 void ViewFrame::ShowPicture(ViewPicturePointer picture) {
@@ -240,7 +240,7 @@ ViewPicturePointer ViewFrame::Turned(const ViewPicturePointer& picture) const {
 }
 
 bool ViewFrame::IsCurrent(const ViewPicturePointer& picture) const {
-  return picture != nullptr && picture->wish.SamePicture(WishOf(place_));
+  return picture != nullptr && picture->request.SamePicture(RequestOf(place_));
 }
 
 // --- showing ---
@@ -248,7 +248,7 @@ bool ViewFrame::IsCurrent(const ViewPicturePointer& picture) const {
 // Each picture and zoom once, with the time since the picture was asked for; each frame of an animation.
 void ViewFrame::LogPaint() {
   if (animation_->Active()) LogEvent("view-frame", animation_->StatusText());
-  const std::string shown = std::to_string(std::lround(canvas_->Zoom() * 100)) + "% " + canvas_->Picture()->wish.path;
+  const std::string shown = std::to_string(std::lround(canvas_->Zoom() * 100)) + "% " + canvas_->Picture()->request.path;
   if (shown == painted_) return;
   painted_ = shown;
   LogEvent("view-painted", shown + " ms=" + std::to_string(std::lround((platform::MonotonicSeconds() - keyTime_) * 1000)));

@@ -60,7 +60,7 @@ class ViewFrame : public wxFrame {
   void PictureCame();
   void ShowPicture(ViewPicturePointer picture);
   void ViewChanged();
-  ViewWish WishOf(size_t place) const;
+  ViewRequest RequestOf(size_t place) const;
   bool IsCurrent(const ViewPicturePointer& picture) const;
   std::string StatusLine() const;
   std::vector<std::string> OverlayLines() const;

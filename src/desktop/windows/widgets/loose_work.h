@@ -10,12 +10,12 @@
 
 namespace fotomill::desktop {
 
-// Work that nobody waits for, since a folder may hang: it is asked to stop, and what it tells when nobody is interested any more is
+// Work that nobody waits for, since a folder may hang: it is asked to stop, and what it reports when nobody is interested any more is
 // dropped. Goes with the window that wants its results.
 class LooseWork {
  public:
   // Has something done on the window's thread, unless the work was stopped meanwhile.
-  using Tell = std::function<void(std::function<void()> action)>;
+  using Report = std::function<void(std::function<void()> action)>;
 
   LooseWork() = default;
   LooseWork(const LooseWork&) = delete;
@@ -23,19 +23,19 @@ class LooseWork {
   ~LooseWork() { Stop(); }
 
   // Runs `work` apart; where it runs out of memory, `failed` on the window's thread. Work that goes on is stopped first.
-  void Start(std::function<void(const StopToken& stop, const Tell& tell)> work, std::function<void()> failed = [] {}) {
+  void Start(std::function<void(const StopToken& stop, const Report& report)> work, std::function<void()> failed = [] {}) {
     Stop();
     source_.emplace();
-    const auto tell = [stop = source_->Token()](std::function<void()> action) {
+    const auto report = [stop = source_->Token()](std::function<void()> action) {
       if (stop.Asked()) return;
       wxTheApp->CallAfter([stop, action = std::move(action)] {
         if (!stop.Asked()) action();
       });
     };
-    const bool begun = RunLoose([stop = source_->Token(), tell, work = std::move(work), failed] {
-      if (Guarded([&] { work(stop, tell); }) != Status::Ok) tell(failed);
+    const bool begun = RunLoose([stop = source_->Token(), report, work = std::move(work), failed] {
+      if (Guarded([&] { work(stop, report); }) != Status::Ok) report(failed);
     });
-    if (!begun) tell(std::move(failed));
+    if (!begun) report(std::move(failed));
   }
   void Stop() {
     if (source_) source_->Stop();
