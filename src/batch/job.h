@@ -12,8 +12,10 @@
 #include "core/fixed_text.h"
 #include "core/status.h"
 #include "core/workers/stop_token.h"
+#include "picture/encode_options.h"
+#include "picture/picture_record.h"
+#include "picture/read_request.h"
 #include "processing/palette/reduce.h"
-#include "registry/registry.h"
 #include "texts/texts.h"
 
 namespace fotomill {

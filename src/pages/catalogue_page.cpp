@@ -19,6 +19,7 @@
 #include "platform/paths.h"
 #include "platform/process.h"
 #include "processing/palette/reduce.h"
+#include "registry/registry.h"
 #include "texts/system_reason.h"
 #include "texts/texts.h"
 

@@ -5,6 +5,9 @@
 
 namespace fotomill {
 
+// A color as 0x00BBGGRR.
+using Color = uint32_t;
+
 // 256 colors, three bytes each in red, green, blue order.
 using Palette = std::array<uint8_t, 768>;
 

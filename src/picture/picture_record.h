@@ -16,8 +16,8 @@
 
 namespace fotomill {
 
-// Color values are 0x00BBGGRR.
-using Color = uint32_t;
+// A picture without a row in the registry.
+inline constexpr int32_t kNoFormat = -1;
 
 // Bits of PictureRecord::alphaFlags.
 inline constexpr uint8_t kHasAlpha = 1;             // the picture has alpha; set by `info` for sources deeper than 24 bits
@@ -69,7 +69,7 @@ struct PictureRecord {
   Palette palette{};
   void* window = nullptr;            // the face's window for which the record was made; not owned
   PackedImage image;                 // empty until `read` succeeds
-  int32_t formatIndex = -1;          // row of the registry, -1 none
+  int32_t formatIndex = kNoFormat;   // row of the registry
   void* context = nullptr;           // the job that asked for the picture; not owned
   std::array<uint8_t, 256> remap{};  // color translation, the identity at first
   DetailLines detailLines;

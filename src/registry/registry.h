@@ -12,8 +12,6 @@
 
 namespace fotomill {
 
-inline constexpr int32_t kNoFormat = -1;
-
 // Row `index` of the registry; the rows live as long as the program. Only `enabled`, `options` and the spare row change.
 // Every thread has a spare row of its own, so that files of different plug-in formats can be in work at once.
 FormatEntry& FormatRow(int32_t index);

@@ -5,6 +5,7 @@
 
 #include "batch/new_job.h"
 #include "pages/catalogue_page.h"
+#include "registry/registry.h"
 #include "settings/settings.h"
 #include "support/bitmaps.h"
 #include "support/files.h"

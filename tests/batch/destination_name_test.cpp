@@ -5,6 +5,7 @@
 #include <set>
 
 #include "batch/prompts.h"
+#include "registry/registry.h"
 
 namespace fotomill::test {
 namespace {

@@ -10,6 +10,7 @@
 #include <thread>
 
 #include "batch/new_job.h"
+#include "registry/registry.h"
 #include "support/bitmaps.h"
 #include "support/faults.h"
 #include "support/files.h"

@@ -2,6 +2,7 @@
 
 #include <gmock/gmock.h>
 
+#include "catalog/thumbnails/thumbnail_record.h"
 #include "platform/clock.h"
 #include "platform/volumes.h"
 #include "support/bitmaps.h"

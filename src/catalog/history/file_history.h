@@ -5,9 +5,10 @@
 #include <string>
 #include <string_view>
 
-#include "catalog/thumbnails/thumbnail_record.h"
-
 namespace fotomill {
+
+template <int32_t side> struct SquareThumbnailRecord;
+using ThumbnailRecord = SquareThumbnailRecord<96>;
 
 // The file history: which picture files the user applied which function to, and when. A list in memory, kept between runs
 // in the text file FileHistoryDatabase + ".fhdb" of the data folder, one line for each entry in list order:

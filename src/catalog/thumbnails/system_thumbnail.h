@@ -4,6 +4,7 @@
 #include <string_view>
 
 #include "catalog/thumbnails/thumbnail_record.h"
+#include "picture/picture_record.h"
 
 namespace fotomill {
 

@@ -3,7 +3,7 @@
 #include <cstdint>
 
 #include "core/choice_lists.h"
-#include "picture/picture_record.h"
+#include "picture/palette.h"
 #include "picture/read_request.h"
 
 namespace fotomill {

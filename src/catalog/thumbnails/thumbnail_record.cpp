@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cstring>
 
+#include "picture/picture_record.h"
 #include "processing/color/blend.h"
 #include "processing/geometry/scale.h"
 #include "processing/promote.h"

@@ -9,9 +9,10 @@
 #include "catalog/thumbnails/thumbnail_options.h"
 #include "picture/packed_image.h"
 #include "picture/palette.h"
-#include "picture/picture_record.h"
 
 namespace fotomill {
+
+struct PictureRecord;
 
 // A picture's thumbnail in a square, as thumbnail files and the thumbnail database hold it. Little-endian:
 //

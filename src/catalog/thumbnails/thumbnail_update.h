@@ -4,10 +4,13 @@
 #include <string>
 #include <vector>
 
-#include "catalog/thumbnails/thumbnail_record.h"
+#include "catalog/thumbnails/thumbnail_options.h"
 #include "core/choice_lists.h"
 
 namespace fotomill {
+
+template <int32_t side> struct SquareThumbnailRecord;
+using ThumbnailRecord = SquareThumbnailRecord<96>;
 
 // What a browser does about thumbnails once it has listed a folder: makes the records that live in memory only, removes
 // thumbnail files that have lost their picture, and offers to make those that are missing.

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cstring>
 
+#include "picture/picture_record.h"
 #include "processing/promote.h"
 
 namespace fotomill {

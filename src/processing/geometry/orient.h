@@ -3,9 +3,11 @@
 #include <cstdint>
 
 #include "core/status.h"
-#include "picture/picture_record.h"
 
 namespace fotomill {
+
+class PackedImage;
+struct PictureRecord;
 
 // How a stored picture must be turned to be upright: the values of EXIF's Orientation tag (0x0112), which name where
 // the stored row 0 and column 0 belong.

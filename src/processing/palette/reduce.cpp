@@ -6,6 +6,7 @@
 #include <cstdlib>
 #include <functional>
 
+#include "picture/picture_record.h"
 #include "processing/color/color_histogram.h"
 #include "processing/color/mix.h"
 #include "processing/color/nearest_color.h"

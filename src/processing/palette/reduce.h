@@ -4,11 +4,12 @@
 
 #include "core/status.h"
 #include "picture/palette.h"
-#include "picture/picture_record.h"
 #include "processing/bands.h"
 #include "processing/palette/dither.h"
 
 namespace fotomill {
+
+struct PictureRecord;
 
 // How colors are reduced; ReduceColors without options takes them from the keys.
 struct ReduceOptions {

@@ -5,6 +5,7 @@
 #include <new>
 
 #include "metadata/exif/picture_exif.h"
+#include "picture/picture_record.h"
 #include "processing/color/blend.h"
 #include "processing/flatten.h"
 #include "processing/pixel_rows.h"

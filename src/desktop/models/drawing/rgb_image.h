@@ -6,7 +6,10 @@
 
 #include "core/status.h"
 #include "picture/packed_image.h"
-#include "picture/picture_record.h"
+
+namespace fotomill {
+struct PictureRecord;
+}
 
 namespace fotomill::desktop {
 

@@ -1,5 +1,6 @@
 #include "desktop/models/thumbnails/thumbnail_offer.h"
 
+#include "catalog/thumbnails/thumbnail_record.h"
 #include "core/workers/background_task.h"
 #include "core/workers/folder_scope.h"
 #include "core/workers/guarded.h"

@@ -7,6 +7,7 @@
 
 #include "core/workers/background_task.h"
 #include "desktop/models/shell/event_log.h"
+#include "desktop/models/view/animation_player.h"
 #include "desktop/windows/view/system_animations.h"
 #include "platform/clock.h"
 #include "registry/registry.h"
@@ -29,6 +30,12 @@ ViewAnimation::ViewAnimation(ViewCanvas& canvas, AnimationBar& bar, Events event
     : canvas_(canvas), bar_(bar), events_(std::move(events)) {
   timer_.Bind(wxEVT_TIMER, [this](wxTimerEvent&) { Tick(); });
 }
+
+ViewAnimation::~ViewAnimation() { End(); }
+
+bool ViewAnimation::Playing() const { return Active() && player_->Playing(); }
+
+bool ViewAnimation::MustFinish() const { return Playing() && !player_->PlayedOnce(); }
 
 void ViewAnimation::Begin(const ViewPicturePointer& picture) {
   End();

@@ -7,11 +7,12 @@
 #include <memory>
 #include <string>
 
-#include "desktop/models/view/animation_player.h"
 #include "desktop/windows/view/animation_bar.h"
 #include "desktop/windows/view/view_canvas.h"
 
 namespace fotomill::desktop {
+
+class AnimationPlayer;
 
 // The animation in a view window: its frames come onto the canvas at their time, with the bar below it.
 class ViewAnimation {
@@ -23,7 +24,7 @@ class ViewAnimation {
   };
 
   ViewAnimation(ViewCanvas& canvas, AnimationBar& bar, Events events);
-  ~ViewAnimation() { End(); }
+  ~ViewAnimation();
   ViewAnimation(const ViewAnimation&) = delete;
   ViewAnimation& operator=(const ViewAnimation&) = delete;
 
@@ -33,7 +34,7 @@ class ViewAnimation {
   // Another picture is awaited.
   void End();
   bool Active() const { return player_ != nullptr; }
-  bool Playing() const { return Active() && player_->Playing(); }
+  bool Playing() const;
   // In full screen there is the picture alone.
   void HideBar(bool hide);
   void Toggle();
@@ -44,7 +45,7 @@ class ViewAnimation {
   // "frame 3 of 12" with what else there is to tell; empty where no animation is.
   std::string StatusText() const;
   // Whether it plays, and has not been shown from beginning to end yet.
-  bool MustFinish() const { return Playing() && !player_->PlayedOnce(); }
+  bool MustFinish() const;
 
  private:
   void PlaceBar();
