@@ -32,11 +32,6 @@ constexpr int kMostLostRaces = 100;
 constexpr const char* kNoName = TrLater("The name would be empty or contain a folder.");
 constexpr const char* kTooLong = TrLater("The path would be longer than 260 characters.");
 
-std::string FolderOf(const std::string& path) {
-  const platform::PathParts parts = platform::SplitPath(path);
-  return std::string(parts.drive) + std::string(parts.folder);
-}
-
 // Whether names are settled by more than a look at the folder.
 bool AsksEveryName(const BatchJob& job) {
   if (job.formatIndex == kNoFormat) return job.prompts != nullptr && (job.naming.askName || job.naming.askPassword);
@@ -366,7 +361,7 @@ class Batch {
   Status Write(PictureRecord& picture, const Destination& destination, const OutputTarget& target, std::string& hint) const {
     const bool beside = (job_.naming.beside || job_.destinationFolder.empty()) && target.output->folder.empty();
     const bool there = beside || !function_.out.empty() || destination.elsewhere;
-    if (!there && !platform::MakeFolders(FolderOf(destination.path))) return Status::ErrorCreatingFile;
+    if (!there && !platform::MakeFolders(platform::FolderOf(destination.path))) return Status::ErrorCreatingFile;
     WriteOptions write{.encode = job_.encode};
     write.existing = destination.replace ? platform::Existing::Replace : platform::Existing::Refuse;
     write.keepMetadata = function_.keepMetadata;
@@ -439,7 +434,7 @@ class Batch {
   std::string WriteHint(const Destination& destination, Status status, const PictureRecord& picture, const OutputTarget& target) const {
     if (status == Status::TooManyColors) return Reduces(target) ? std::string() : function_.reduceHint;
     const std::string& path = destination.path;
-    const std::string folder = FolderOf(path);
+    const std::string folder = platform::FolderOf(path);
     if (status == Status::ErrorWritingFile && !platform::SystemReason().empty()) return ReasonSentence();
     const bool full = status == Status::ErrorWritingFile && platform::FreeSpace(folder) < picture.image.Bytes().size();
     if (full) return Tr("Not enough disk space at the destination.");

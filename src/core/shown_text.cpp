@@ -3,36 +3,13 @@
 #include <algorithm>
 #include <cstdint>
 
+#include "core/utf8.h"
+
 namespace fotomill {
 
 namespace {
 
 uint8_t ByteAt(std::string_view text, size_t place) { return static_cast<uint8_t>(text[place]); }
-
-// Bytes of the well-formed UTF-8 character at the start of `text` (Unicode, table 3-7), 0 if there is none.
-size_t CharacterLength(std::string_view text) {
-  const uint8_t first = ByteAt(text, 0);
-  if (first < 0x80) return 1;
-  size_t length = 0;
-  uint8_t lowest = 0x80, highest = 0xBF;  // of the second byte: neither too long a form, nor a surrogate, nor too large
-  if (first >= 0xC2 && first <= 0xDF) {
-    length = 2;
-  } else if (first >= 0xE0 && first <= 0xEF) {
-    length = 3;
-    if (first == 0xE0) lowest = 0xA0;
-    if (first == 0xED) highest = 0x9F;
-  } else if (first >= 0xF0 && first <= 0xF4) {
-    length = 4;
-    if (first == 0xF0) lowest = 0x90;
-    if (first == 0xF4) highest = 0x8F;
-  }
-  if (length == 0 || text.size() < length) return 0;
-  if (ByteAt(text, 1) < lowest || ByteAt(text, 1) > highest) return 0;
-  for (size_t i = 2; i < length; ++i) {
-    if ((ByteAt(text, i) & 0xC0) != 0x80) return 0;
-  }
-  return length;
-}
 
 bool IsControl(std::string_view character) {
   const uint8_t first = ByteAt(character, 0);
@@ -68,15 +45,6 @@ std::string EscapeControls(std::string_view text) {
     text.remove_prefix(character.size());
   }
   return result;
-}
-
-bool IsUtf8(std::string_view text) {
-  while (!text.empty()) {
-    const size_t length = CharacterLength(text);
-    if (length == 0) return false;
-    text.remove_prefix(length);
-  }
-  return true;
 }
 
 }  // namespace fotomill

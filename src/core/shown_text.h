@@ -11,7 +11,4 @@ namespace fotomill {
 // that no text can steer a terminal or break a line. Everything else stays.
 std::string EscapeControls(std::string_view text);
 
-// Whether a text is well-formed UTF-8, without surrogates and overlong forms.
-bool IsUtf8(std::string_view text);
-
 }  // namespace fotomill

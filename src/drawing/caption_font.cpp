@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "core/text.h"
+#include "core/utf8.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
@@ -67,23 +68,6 @@ void CollectFonts(const std::string& folder, int depth, FontFiles& fonts) {
   }
 }
 
-// Takes one character of UTF-8 off a text; bytes that are none count as unknown, one by one.
-uint32_t TakeCharacter(std::string_view& text) {
-  const auto byte = [&](size_t i) { return i < text.size() ? static_cast<uint8_t>(text[i]) : uint32_t{0}; };
-  constexpr uint32_t kLeast[] = {0, 0, 0x80, 0x800, 0x10000};
-  const uint32_t lead = byte(0);
-  const size_t length = lead < 0x80 ? 1 : lead >> 5 == 6 ? 2 : lead >> 4 == 14 ? 3 : lead >> 3 == 30 ? 4 : 0;
-  uint32_t value = length == 1 ? lead : lead & (0xFFu >> (length + 1));
-  bool good = length > 0;
-  for (size_t i = 1; i < length; ++i) {
-    good = good && byte(i) >> 6 == 2;
-    value = value << 6 | (byte(i) & 63);
-  }
-  good = good && value >= kLeast[length];
-  text.remove_prefix(good ? length : 1);
-  return good ? value : kUnknownCharacter;
-}
-
 }  // namespace
 
 struct CaptionFont::Fonts {
@@ -137,7 +121,7 @@ struct CaptionFont::Fonts {
     FT_Face before = nullptr;
     FT_UInt glyphBefore = 0;
     while (!text.empty()) {
-      uint32_t character = TakeCharacter(text);
+      uint32_t character = NextCharacter(text, kUnknownCharacter);
       if (character < 0x20 || (character >= 0x7F && character < 0xA0)) character = kUnknownCharacter;
       const auto [face, glyph] = FaceFor(character);
       FT_Vector kerning = {0, 0};
@@ -181,7 +165,7 @@ std::string CaptionFont::Fitted(std::string_view text, int32_t width) {
   if (WidthOf(text) <= width) return std::string(text);
   std::string fitted(kEllipsis);
   for (std::string_view rest = text; !rest.empty();) {
-    (void)TakeCharacter(rest);
+    (void)NextCharacter(rest, kUnknownCharacter);
     std::string longer = std::string(text.substr(0, text.size() - rest.size())).append(kEllipsis);
     if (WidthOf(longer) > width) break;
     fitted = std::move(longer);

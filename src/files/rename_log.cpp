@@ -73,7 +73,7 @@ bool RenameLog::LockForUndo() { return DataFile(kLogName).empty() || LockFile(fa
 // A log that takes the place of one that was shortened meanwhile goes on with what is left of that.
 bool RenameLog::Begin(bool fresh) {
   const std::string path = DataFile(kLogName);
-  if (path.empty() || !platform::MakeFolders(std::string(platform::SplitPath(path).folder)) || !LockFile(true)) return false;
+  if (path.empty() || !platform::MakeFolders(platform::FolderOf(path)) || !LockFile(true)) return false;
   if (fresh && !file_.InUseByOthers() && !file_.Resize(0)) return false;
   (void)file_.MarkInUse();  // without it two runs at once cannot both be taken back
   return !number_ || Append({{}, std::to_string(*number_)});

@@ -9,6 +9,11 @@ std::string JoinPath(const PathParts& parts) {
   return path;
 }
 
+std::string FolderOf(std::string_view path) {
+  const PathParts parts = SplitPath(path);
+  return std::string(parts.drive).append(parts.folder);
+}
+
 std::string JoinFolder(std::string_view folder, std::string_view name) {
   std::string path(folder);
   if (!path.empty() && path.back() != kSeparator) path += kSeparator;

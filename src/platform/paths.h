@@ -21,6 +21,8 @@ std::string JoinPath(const PathParts& parts);
 std::string JoinFolder(std::string_view folder, std::string_view name);
 // The name with extension, without drive and folder.
 std::string_view FileNameOf(std::string_view path);
+// Drive and folder, with their closing separator; empty for a bare name.
+std::string FolderOf(std::string_view path);
 // The extension without its dot.
 std::string_view ExtensionOf(std::string_view path);
 

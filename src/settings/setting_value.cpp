@@ -4,6 +4,7 @@
 #include <optional>
 
 #include "core/plain_name.h"
+#include "core/utf8.h"
 #include "core/whole_number.h"
 #include "settings/spin_range.h"
 #include "texts/texts.h"
@@ -58,15 +59,6 @@ SettingValue ReadNumberValue(const KeyRow& row, std::string_view text, ValueSour
   value.usable = value.fault == ValueFault::None || (source == ValueSource::File && value.fault != ValueFault::NotColor);
   if (value.fault == ValueFault::NotFlag) value.number = 1;
   return value;
-}
-
-// The first `limit` bytes, less the beginning of a UTF-8 character that would be cut.
-std::string_view CutText(std::string_view text, size_t limit) {
-  if (text.size() <= limit) return text;
-  size_t size = limit;
-  while (size > 0 && limit - size < 3 && (static_cast<unsigned char>(text[size]) & 0xC0) == 0x80) --size;
-  const bool character = (static_cast<unsigned char>(text[size]) & 0xC0) == 0xC0;
-  return text.substr(0, character ? size : limit);
 }
 
 SettingValue ReadTextValue(const KeyRow& row, std::string_view text, ValueSource source) {

@@ -37,7 +37,7 @@ std::string CatalogFolder() {
   const std::string program = platform::ProgramFolder();
   const std::string beside = platform::JoinFolder(program, "locale");
   if (platform::IsFolder(beside)) return beside;
-  return platform::JoinFolder(std::string(platform::SplitPath(program).folder), "share/locale");
+  return platform::JoinFolder(platform::FolderOf(program), "share/locale");
 }
 
 bool HasCatalog(const std::string& folder, const std::string& code) {
@@ -132,10 +132,6 @@ std::vector<Language> Languages() {
 }
 
 const char* Tr(const char* text) { return state.translated && *text != '\0' ? dgettext(kDomain, text) : text; }
-
-size_t CharacterCount(std::string_view text) {
-  return static_cast<size_t>(std::ranges::count_if(text, [](char c) { return (static_cast<unsigned char>(c) & 0xC0) != 0x80; }));
-}
 
 std::string ThousandsText(uint64_t number) {
   // Translators: a thousand, with the separator of the language.

@@ -68,9 +68,6 @@ std::string DecimalText(double number, int digits);
 // Marks a text in a table for translation; whoever shows it calls Tr.
 constexpr const char* TrLater(const char* text) { return text; }
 
-// The number of characters of a text, for columns of lines.
-size_t CharacterCount(std::string_view text);
-
 // A language with a catalog, or English.
 struct Language {
   std::string code;  // "de", "pt_BR"

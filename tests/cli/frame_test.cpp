@@ -5,6 +5,7 @@
 #include "cli/frame/commands.h"
 #include "cli/frame/shown_text.h"
 #include "core/shown_text.h"
+#include "core/utf8.h"
 #include "support/command_line.h"
 #include "support/scoped_environment.h"
 

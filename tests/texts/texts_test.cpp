@@ -33,8 +33,6 @@ TEST(Texts, RecordedTextsKeepTheirEnglish) {
   EXPECT_EQ(text.english, "First 1. Second.");
 }
 
-TEST(Texts, CharactersAreNotBytes) { EXPECT_EQ(CharacterCount("Größe"), 5u); }
-
 // Texts of tables are translated where they are shown; xgettext finds them only if the table marks them with TrLater.
 TEST(Texts, TablesAreMarkedForTranslation) {
   std::string pot;

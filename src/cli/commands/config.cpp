@@ -7,6 +7,7 @@
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
 #include "cli/frame/shown_text.h"
+#include "core/utf8.h"
 #include "platform/files.h"
 #include "settings/configuration.h"
 #include "texts/system_reason.h"

@@ -10,6 +10,7 @@
 #include "core/data_folder.h"
 #include "core/shown_text.h"
 #include "core/text.h"
+#include "core/utf8.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"

@@ -10,6 +10,7 @@
 #include "cli/frame/used_files.h"
 #include "core/shown_text.h"
 #include "core/text.h"
+#include "core/utf8.h"
 #include "registry/registry.h"
 #include "settings/job_options.h"
 #include "texts/texts.h"

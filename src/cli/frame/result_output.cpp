@@ -2,6 +2,7 @@
 
 #include "batch/progress_model.h"
 #include "cli/frame/shown_text.h"
+#include "core/utf8.h"
 #include "platform/process.h"
 #include "texts/texts.h"
 

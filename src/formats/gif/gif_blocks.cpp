@@ -13,7 +13,7 @@ namespace {
 
 constexpr uint64_t kMostPixelsPerByte = 4096;  // more than LZW with 12-bit codes can ever reach
 
-GifPalette TakePalette(ByteReader& bytes, uint8_t flags) {
+GifPalette ReadPalette(ByteReader& bytes, uint8_t flags) {
   if ((flags & 0x80) == 0) return {};
   const int32_t bits = (flags & 7) + 1;
   return {bytes.Take(uint64_t{3} << bits), bits};
@@ -50,7 +50,7 @@ void ParseFrame(ByteReader& bytes, GifScreen& screen, GifFrame& frame) {
   frame.height = bytes.Le16();
   const uint8_t flags = bytes.U8();
   frame.interlaced = (flags & 0x40) != 0;
-  frame.palette = TakePalette(bytes, flags);
+  frame.palette = ReadPalette(bytes, flags);
   if (frame.palette.bits == 0) frame.palette = screen.palette;
   frame.dataOffset = bytes.Position();
   frame.pixelBits = bytes.U8();
@@ -84,7 +84,7 @@ Status ParseScreen(ByteReader& bytes, GifScreen& screen) {
   screen.height = bytes.Le16();
   const uint8_t flags = bytes.U8();
   bytes.Skip(2);
-  screen.palette = TakePalette(bytes, flags);
+  screen.palette = ReadPalette(bytes, flags);
   return bytes.Ok() ? Status::Ok : Status::FileReadError;
 }
 

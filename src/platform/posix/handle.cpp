@@ -111,9 +111,13 @@ bool SyncHandle(int handle) {
   return result == 0;
 }
 
+std::string OpenableFolderOf(const std::string& path) {
+  const std::string folder = FolderOf(path);
+  return folder.empty() ? "." : folder;
+}
+
 void SyncFolderOf(const std::string& path) {
-  const std::string folder(SplitPath(path).folder);
-  const Handle handle = OpenHandle(folder.empty() ? "." : folder.c_str(), O_RDONLY | O_DIRECTORY);
+  const Handle handle = OpenHandle(OpenableFolderOf(path).c_str(), O_RDONLY | O_DIRECTORY);
   if (handle.IsOpen()) SyncHandle(handle.Number());
 }
 

@@ -57,6 +57,8 @@ extern std::atomic<UnnamedFiles> unnamedFiles;
 
 // fsync(2), repeated when a signal interrupts it.
 bool SyncHandle(int handle);
+// The folder of a path as it can be opened: "." for a bare name.
+std::string OpenableFolderOf(const std::string& path);
 // Makes the names in the folder of `path` last. Its failure is not reported: the file itself is in place, and some file
 // systems cannot do it.
 void SyncFolderOf(const std::string& path);

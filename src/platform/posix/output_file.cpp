@@ -33,11 +33,6 @@ namespace {
 constexpr int kAttempts = 100;
 constexpr size_t kCopyStep = size_t{1} << 30;
 
-std::string FolderOf(const std::string& path) {
-  const std::string folder(SplitPath(path).folder);
-  return folder.empty() ? "." : folder;
-}
-
 // ".fmw-OWNER-N.tmp" beside the destination: hidden, short, and unique within this machine and process.
 std::string TemporarySibling(const std::string& path) {
   static std::atomic<unsigned> counter{0};
@@ -116,7 +111,7 @@ bool OutputFile::Create(const std::string& path) {
   }
   path_ = path;
   failed_ = false;
-  handle_ = OpenUnnamed(FolderOf(path), mode).Release();
+  handle_ = OpenUnnamed(OpenableFolderOf(path), mode).Release();
   if (handle_ < 0 && !CreateNamedSibling(mode)) {
     KeepErrno();
     return false;
@@ -126,7 +121,7 @@ bool OutputFile::Create(const std::string& path) {
 }
 
 bool OutputFile::CreateNamedSibling(unsigned mode) {
-  DeleteStaleFiles(FolderOf(path_));
+  DeleteStaleFiles(OpenableFolderOf(path_));
   for (int attempt = 0; attempt < kAttempts; ++attempt) {
     std::string name = TemporarySibling(path_);
     const int handle = OpenHandle(name.c_str(), O_RDWR | O_CREAT | O_EXCL | O_NOFOLLOW, mode).Release();
@@ -211,7 +206,7 @@ CommitResult OutputFile::TakeName(Existing existing, bool replaces, bool& synced
 // Gives an unnamed sibling a temporary name.
 bool OutputFile::NameSibling() {
   if (FaultDue()) return false;
-  DeleteStaleFiles(FolderOf(path_));
+  DeleteStaleFiles(OpenableFolderOf(path_));
   for (int attempt = 0; attempt < kAttempts; ++attempt) {
     std::string name = TemporarySibling(path_);
     if (NameUnnamed(handle_, name)) {

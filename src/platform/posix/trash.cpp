@@ -254,7 +254,7 @@ bool RestoreFromTrash(const std::string& path) {
   Victim victim;
   struct stat facts;
   victim.name = FileNameOf(path);
-  victim.folder = RealPath(std::string(SplitPath(path).folder));
+  victim.folder = RealPath(FolderOf(path));
   if (victim.name.empty() || victim.folder.empty() || stat(victim.folder.c_str(), &facts) != 0) return false;
   victim.device = facts.st_dev;
   for (const Place& place : PlacesFor(victim)) {
@@ -274,7 +274,7 @@ bool HasTrash(const std::string& path) {
   for (const Place& place : PlacesFor(victim)) {
     const bool there = FileExists(place.folder);
     if (there && place.shared && !IsOwnFolder(place.folder)) continue;
-    if (MayWriteTo(NearestFolder(there ? place.folder : std::string(SplitPath(place.folder).folder)))) return true;
+    if (MayWriteTo(NearestFolder(there ? place.folder : FolderOf(place.folder)))) return true;
   }
   return false;
 }

@@ -28,8 +28,6 @@ constexpr int kDeepest = 64;  // levels of folders
 // The reason of a failure, empty for success.
 using Outcome = std::string;
 
-std::string FolderOf(const std::string& path) { return std::string(platform::SplitPath(path).folder); }
-
 Outcome CopyFile(const std::string& from, const std::string& to, platform::Existing existing) {
   constexpr size_t kPart = 4 * 1024 * 1024;
   platform::FileView view;
@@ -79,7 +77,7 @@ Outcome DeleteTree(const std::string& path, int depth) {
 }
 
 bool SameVolume(const std::string& a, const std::string& b) {
-  return platform::FactsOf(a).device == platform::FactsOf(FolderOf(b)).device;
+  return platform::FactsOf(a).device == platform::FactsOf(platform::FolderOf(b)).device;
 }
 
 Outcome MoveOne(const std::string& from, const std::string& to) {

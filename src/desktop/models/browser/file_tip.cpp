@@ -5,6 +5,7 @@
 #include <utility>
 
 #include "core/choice_lists.h"
+#include "core/utf8.h"
 #include "desktop/models/browser/browser_model.h"
 #include "platform/paths.h"
 #include "registry/registry.h"
@@ -22,9 +23,7 @@ std::string Beginning(std::string_view text) {
   text = text.substr(0, text.find('\0'));
   while (!text.empty() && static_cast<unsigned char>(text.back()) <= ' ') text.remove_suffix(1);
   if (text.size() <= kLongestComment) return std::string(text);
-  size_t end = kLongestComment;
-  while (end > 0 && (static_cast<unsigned char>(text[end]) & 0xC0) == 0x80) --end;
-  return std::string(text.substr(0, end)) + "...";
+  return std::string(CutText(text, kLongestComment)) + "...";
 }
 
 // The lines that need the file's header.

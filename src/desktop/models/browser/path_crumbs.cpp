@@ -3,8 +3,8 @@
 #include <algorithm>
 #include <numeric>
 
-#include "core/shown_text.h"
 #include "core/text.h"
+#include "core/utf8.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
 

@@ -31,11 +31,6 @@ constexpr HistoryColumnFacts kColumns[] = {
 };
 // clang-format on
 
-std::string FolderOf(const std::string& path) {
-  const platform::PathParts parts = platform::SplitPath(path);
-  return std::string(parts.drive) + std::string(parts.folder);
-}
-
 // Negative when `a` is before `b`. Where the column does not decide, the names do, and then the last use.
 int Compare(const HistoryRow& a, const HistoryRow& b, int32_t column) {
   const auto larger = [](auto left, auto right) { return left > right ? -1 : left < right ? 1 : 0; };
@@ -46,7 +41,7 @@ int Compare(const HistoryRow& a, const HistoryRow& b, int32_t column) {
     case choice::kColumnCreated: order = larger(a.created, b.created); break;
     case choice::kColumnAccessed: order = larger(a.accessed, b.accessed); break;
     case choice::kColumnSize: order = larger(a.size, b.size); break;
-    case choice::kColumnPath: order = CompareNatural(FolderOf(a.path), FolderOf(b.path)); break;
+    case choice::kColumnPath: order = CompareNatural(platform::FolderOf(a.path), platform::FolderOf(b.path)); break;
     default: break;
   }
   if (order == 0) order = CompareNatural(platform::FileNameOf(a.path), platform::FileNameOf(b.path));
@@ -93,7 +88,7 @@ std::string FileHistoryList::Cell(size_t row, size_t column) const {
     case choice::kColumnCreated: return HistoryDate(entry.created, settings.FileHistoryDateMode);
     case choice::kColumnAccessed: return HistoryDate(entry.accessed, settings.FileHistoryDateMode);
     case choice::kColumnSize: return WithThousands(entry.size);
-    default: return FolderOf(entry.path);
+    default: return platform::FolderOf(entry.path);
   }
 }
 

@@ -31,7 +31,7 @@ bool InDatabase(const ThumbnailRequest& request) { return request.mode == choice
 
 std::string DatabaseFor(const ThumbnailRequest& request) {
   return ThumbnailDatabasePath(request.mode == choice::kGlobalDatabase ? std::string()
-                                                                    : std::string(platform::SplitPath(request.path).folder));
+                                                                    : platform::FolderOf(request.path));
 }
 
 // The database that was asked last stays open: its index is what makes a search quick. New records are gathered, since
@@ -193,7 +193,7 @@ void DropThumbnails(const std::string& path) {
   ThumbnailRecord record;
   if (!platform::FactsOf(file).link && ReadThumbnailFile(record, file)) (void)platform::DeleteFile(file);
   openDatabase.Drop(path, ThumbnailDatabasePath({}));
-  openDatabase.Drop(path, ThumbnailDatabasePath(std::string(platform::SplitPath(path).folder)));
+  openDatabase.Drop(path, ThumbnailDatabasePath(platform::FolderOf(path)));
 }
 
 Status WriteThumbnail(const std::string& path, const ThumbnailOptions& options) {

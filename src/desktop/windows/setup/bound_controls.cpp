@@ -6,7 +6,7 @@
 #include <wx/stattext.h>
 #include <wx/textctrl.h>
 
-#include "core/shown_text.h"
+#include "core/utf8.h"
 #include "core/whole_number.h"
 #include "desktop/windows/setup/color_button.h"
 #include "desktop/windows/setup/mask_list.h"
