@@ -37,6 +37,7 @@ struct OutputPlace {
   std::string_view subfolder;  // and beneath that one
   std::string_view base;       // name without extension
 };
+// As above, for one of several outputs.
 std::string PlannedDestination(const std::string& source, const OutputPlace& place, const BatchJob& job);
 
 // A destination without drive and folder, put into the job's destination folder; others stay. nullopt when that gives 261
@@ -87,6 +88,7 @@ enum class DestinationAnswer : int32_t { Write = 1, Skip = 2 };
 // the file exists. `title` says what the name is for, `picture` is the new picture for previews; both are optional. `variant`
 // makes numbered variants.
 using VariantMaker = std::function<VariantSearch(std::string& path)>;
+// Settles `destination` in place; Skip leaves its file out.
 DestinationAnswer MakeDestinationName(Destination& destination, const std::string& source, std::string_view title, BatchJob& job,
                                       const TakenTest& taken, const VariantMaker& variant,
                                       const PictureRecord* picture = nullptr);

@@ -43,6 +43,7 @@ struct NamingOptions {
   // those that put nothing there.
   std::array<FixedText<32>, kFileFunctionCount> prefixes = {};
 
+  // Empty for functions that put nothing there.
   std::string_view PrefixOf(FileFunction function) const { return prefixes[static_cast<size_t>(function)].view(); }
 };
 

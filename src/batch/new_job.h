@@ -10,6 +10,7 @@ namespace fotomill {
 // A job with the policies, names and options of the settings in force. It runs with them, whatever is changed until it does,
 // and keeps permanently by StoreRemembered what its user changes on the way.
 BatchJob NewBatchJob();
+// The keys of the progress box, as they are in force.
 ProgressSettings ProgressSettingsFromSettings();
 // The SequentialRename... keys.
 SequentialRenameRules SequentialRenameRulesFromSettings();

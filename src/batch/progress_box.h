@@ -20,7 +20,7 @@ class ProgressBox {
   virtual bool Open(const ProgressModel& model) = 0;
   // A new last line of the list; `outcome` is null for lines that are not about a file.
   virtual void ShowLine(const ProgressLine& line, const FileOutcome* outcome) = 0;
-  virtual void ShowStatus(const std::string& status) = 0;
+  virtual void ShowStatus(const std::string& status) = 0;  // replaces the status line
   // `done` of `count` files are finished.
   virtual void ShowProgress(uint32_t done, uint32_t count) { (void)done, (void)count; }
   // Called several times a second while the batch waits, to redraw times.
@@ -41,6 +41,7 @@ bool OpenProgressBox(BatchJob& job);
 void ReportFile(BatchJob& job, std::string_view text, uint32_t index, uint32_t count);
 // The same with the outcome of the file. The text is FileLine(outcome); a failure sets the job's error flag.
 void ReportOutcome(BatchJob& job, const FileOutcome& outcome, uint32_t index, uint32_t count);
+// Sets the job's status line and shows it in its box, if there is one.
 void SetStatus(BatchJob& job, std::string_view text);
 // Adds the closing lines and closes the box or leaves it open for reading, as CloseProgressWhenDone says.
 void FinishProgress(BatchJob& job);

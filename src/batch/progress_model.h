@@ -36,6 +36,7 @@ struct ProgressSettings {
 
 // The box's title, and the window class by which other programs find it.
 inline constexpr const char* kProgressTitle = "Progress";
+// Name of the window's class.
 inline constexpr const char* kProgressBoxClass = "FotomillProfessionalProgressBox";
 
 // Numbers of the box's controls.
@@ -46,18 +47,18 @@ class ProgressModel {
  public:
   // Empties the list; Abort is live, Close is not.
   void Open();
-  void AddLine(ProgressLine line);
-  void SetStatus(std::string_view text) { status_ = text; }
+  void AddLine(ProgressLine line);  // at the end of the list
+  void SetStatus(std::string_view text) { status_ = text; }  // the line below the list
   // Adds the closing lines: "There were errors" where there were, and, with `summary`, how many files were processed; the
   // last line is selected. Then closes the box, or leaves it open to be read: with a scroll bar, Close live and Abort not.
   void Finish(bool errors, bool summary, const ProgressSettings& box);
-  void Close() { open_ = abortLive_ = closeLive_ = false; }
+  void Close() { open_ = abortLive_ = closeLive_ = false; }  // both buttons go dead with it
 
   // What the box shows: whether it is there, which of its buttons can be pressed, its lines and the
   // text below them.
   bool IsOpen() const { return open_; }
-  bool AbortLive() const { return abortLive_; }
-  bool CloseLive() const { return closeLive_; }
+  bool AbortLive() const { return abortLive_; }  // the Abort button can be pressed
+  bool CloseLive() const { return closeLive_; }  // the Close button can be pressed
   bool HasScrollBar() const { return scrollBar_; }  // the list of a box that was left open
   const std::vector<ProgressLine>& Lines() const { return lines_; }
   const std::string& StatusText() const { return status_; }

@@ -11,16 +11,22 @@ namespace fotomill {
 
 // The texts of the overwrite prompt.
 inline constexpr std::string_view kOverwriteTitle = TrLater("Overwrite File");
+// The question of the prompt.
 inline constexpr std::string_view kOverwriteText =
     TrLater("Click on OK to overwrite the existing file.\nChange the file name and click on Ok for a new name.\n"
             "Click on Cancel to skip this file.");
-inline constexpr std::string_view kOverwriteHelpPage = "OVERWRITE";
+inline constexpr std::string_view kOverwriteHelpPage = "OVERWRITE";  // of the overwrite prompt
+// Check box: later files are asked about as well.
 inline constexpr std::string_view kNotifyText = TrLater("Notify me the next time I'm about to overwrite a file");
 inline constexpr std::string_view kNotifyNote =
     TrLater("Note: if you disable this option, it can be re-enabled later in the Setup window.");
+// Check box: write a numbered variant.
 inline constexpr std::string_view kKeepBothText = TrLater("Keep both files");
+// Check box: the answer holds for the rest of the job.
 inline constexpr std::string_view kApplyToRestText = TrLater("Apply to rest of batch");
+// Check box: a replaced file goes to the recycle bin.
 inline constexpr std::string_view kRecycleText = TrLater("Move ovewritten files to recycle bin");
+// Check box: both pictures are shown.
 inline constexpr std::string_view kPreviewsText = TrLater("Show previews");
 
 // The five check boxes of the overwrite prompt.

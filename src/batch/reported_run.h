@@ -27,6 +27,7 @@ class ReportedRun {
     bool dryRun = false;
   };
 
+  // Files and job must outlive the run.
   ReportedRun(std::span<const BatchFile> files, BatchJob& job, Task task);
 
   // At most `jobs` files at a time; 0: one per core.

@@ -13,7 +13,7 @@ namespace fotomill {
 // The names of a run: its sources, its outputs, and existing files. Not thread-safe.
 class RunNames {
  public:
-  RunNames();
+  RunNames();  // relative paths are relative to the current folder of this moment
 
   // A source of the run; and a path that one of its outputs would have.
   void AddSource(const std::string& source);

@@ -25,6 +25,7 @@ struct ExifDirectories {
   bool bigEndian = false;
   ExifDirectory first;  // what the first directory says of the picture, not of the file that holds it
   ExifDirectory exif, gps, interoperability;
+  // No directory has an entry.
   bool Empty() const { return first.empty() && exif.empty() && gps.empty(); }
 };
 
@@ -56,6 +57,7 @@ PlacedExif PlaceExif(const ExifDirectories& directories, uint32_t base);
 
 // The orientation that the first directory tells, 1 to 8; 1 when it does not.
 uint16_t OrientationOf(const ExifDirectories& directories);
+// Puts the entry into the first directory, in place of one that is there.
 void SetOrientation(ExifDirectories& directories, uint16_t orientation);
 
 }  // namespace fotomill

@@ -14,8 +14,10 @@ namespace fotomill {
 // What the APP1 segments of EXIF and XMP begin with, and how much of each fits into one segment
 // behind it.
 inline constexpr std::string_view kExifHead("Exif\0\0", 6);
+// XMP specification part 3, section 1.1.3; with its zero.
 inline constexpr std::string_view kXmpHead("http://ns.adobe.com/xap/1.0/\0", 29);
 inline constexpr size_t kMostSegment = 65533;  // data of one segment
+// Bytes of a block in one segment.
 inline constexpr size_t kMostExif = kMostSegment - 6, kMostXmp = kMostSegment - 29;
 
 // Where a segment is in its file; it may claim more than there is.
@@ -52,7 +54,7 @@ struct JpegSegment {
   uint8_t marker = 0;
   std::span<const uint8_t> data;   // behind the length
   std::span<const uint8_t> whole;  // with marker and length
-  bool Starts(std::string_view head) const;
+  bool Starts(std::string_view head) const;  // the payload begins with `head`
 };
 // The segments in the order of the file, up to the first scan.
 struct JpegHead {
@@ -61,7 +63,7 @@ struct JpegHead {
 
   // What the first EXIF and XMP segments hold behind their headings; empty if there is none.
   std::span<const uint8_t> Exif() const;
-  std::span<const uint8_t> Xmp() const;
+  std::span<const uint8_t> Xmp() const;  // empty where the file has none
   // Whether EXIF continues in further segments: then what it points to there must stay where it is.
   bool HasSplitExif() const;
   // Whether further pictures are behind the first, with an index of their places (CIPA DC-007, "MPF").

@@ -13,21 +13,21 @@ namespace fotomill {
 // read decides an allocation or a loop. The reader does not own the bytes.
 class ByteReader {
  public:
-  explicit ByteReader(std::span<const uint8_t> bytes) : bytes_(bytes) {}
+  explicit ByteReader(std::span<const uint8_t> bytes) : bytes_(bytes) {}  // does not own the bytes
 
   // Whether no read has run past the end so far; where the next read begins, and what is left of
   // how many bytes.
   bool Ok() const { return !short_; }
-  uint64_t Position() const { return position_; }
-  uint64_t Left() const { return bytes_.size() - position_; }
-  uint64_t Size() const { return bytes_.size(); }
+  uint64_t Position() const { return position_; }  // bytes from the start
+  uint64_t Left() const { return bytes_.size() - position_; }  // bytes up to the end
+  uint64_t Size() const { return bytes_.size(); }  // all bytes, read or not
 
   // Numbers in the byte order of their name; 0 where not all of their bytes are there.
   uint8_t U8() { return position_ < bytes_.size() ? bytes_[position_++] : static_cast<uint8_t>(Fail()); }
-  uint16_t Le16() { return static_cast<uint16_t>(Little(2)); }
+  uint16_t Le16() { return static_cast<uint16_t>(Little(2)); }  // little-endian
   uint32_t Le32() { return static_cast<uint32_t>(Little(4)); }
   uint64_t Le64() { return Little(8); }
-  uint16_t Be16() { return static_cast<uint16_t>(Big(2)); }
+  uint16_t Be16() { return static_cast<uint16_t>(Big(2)); }  // big-endian
   uint32_t Be32() { return static_cast<uint32_t>(Big(4)); }
   uint64_t Be64() { return Big(8); }
 
@@ -43,7 +43,7 @@ class ByteReader {
   }
   // The next bytes without consuming them, as many as are left but at most `count`.
   std::span<const uint8_t> Peek(uint64_t count) const { return bytes_.subspan(position_, count < Left() ? count : Left()); }
-  void Skip(uint64_t count) { (void)Take(count); }
+  void Skip(uint64_t count) { (void)Take(count); }  // beyond the end: fails as a read does
   // Moves to an offset from the start; beyond the end the reader is short.
   void Seek(uint64_t offset) {
     if (offset > bytes_.size()) {

@@ -26,11 +26,13 @@ class ByteWriter {
   // These append at Position(), numbers in the byte order of their name, a text without a closing
   // zero.
   void U8(uint8_t value) { *Room(1) = value; }
-  void Le16(uint16_t value) { Little(value, 2); }
+  void Le16(uint16_t value) { Little(value, 2); }  // little-endian
   void Le32(uint32_t value) { Little(value, 4); }
-  void Be16(uint16_t value) { Big(value, 2); }
+  void Be16(uint16_t value) { Big(value, 2); }  // big-endian
   void Be32(uint32_t value) { Big(value, 4); }
+  // Its bytes, without a closing zero.
   void Text(std::string_view text) { Bytes({reinterpret_cast<const uint8_t*>(text.data()), text.size()}); }
+  // Padding.
   void Zeros(uint64_t count) {
     for (; count > 0; --count) U8(0);
   }
@@ -54,7 +56,7 @@ class ByteWriter {
     while (kBufferSize - used_ < most) FlushBlock();
     return buffer_.Data() + used_;
   }
-  void Used(size_t count) { used_ += count; }
+  void Used(size_t count) { used_ += count; }  // so many of the reserved bytes were filled
   static constexpr size_t kMostReserved = 128 * 1024;
 
   // Bytes written so far.
@@ -69,11 +71,13 @@ class ByteWriter {
     }
     if (!bytes.empty()) std::memcpy(buffer_.Data() + (offset - flushed_), bytes.data(), bytes.size());
   }
+  // At an offset that was written before.
   void PatchBe32(uint64_t offset, uint32_t value) {
     const uint8_t bytes[] = {static_cast<uint8_t>(value >> 24), static_cast<uint8_t>(value >> 16),
                              static_cast<uint8_t>(value >> 8), static_cast<uint8_t>(value)};
     Patch(offset, bytes);
   }
+  // At an offset that was written before.
   void PatchLe32(uint64_t offset, uint32_t value) {
     const uint8_t bytes[] = {static_cast<uint8_t>(value), static_cast<uint8_t>(value >> 8), static_cast<uint8_t>(value >> 16),
                              static_cast<uint8_t>(value >> 24)};

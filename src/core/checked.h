@@ -10,6 +10,7 @@ template <std::integral T>
 [[nodiscard]] constexpr bool CheckedAdd(T a, T b, T& result) {
   return !__builtin_add_overflow(a, b, &result);
 }
+// False when the product overflows.
 template <std::integral T>
 [[nodiscard]] constexpr bool CheckedMultiply(T a, T b, T& result) {
   return !__builtin_mul_overflow(a, b, &result);

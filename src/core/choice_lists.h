@@ -89,7 +89,7 @@ struct ChoiceEntry {
   int32_t value;
   int32_t reserved[4];
 };
-static_assert(sizeof(void*) != 4 || sizeof(ChoiceEntry) == 24);
+static_assert(sizeof(void*) != 4 || sizeof(ChoiceEntry) == 24);  // six words, as plug-ins see it
 
 // The list of each choice key in settings.def. The texts are what Setup dialogs show, in English.
 extern const ChoiceEntry kDateModeChoices[], kDistanceUnitChoices[], kDitherChoices[], kDropChoices[], kExtensionCaseChoices[],

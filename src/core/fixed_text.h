@@ -33,10 +33,11 @@ class FixedText {
   // The text up to its zero byte. Who writes through `data` keeps within Capacity() and the zero
   // behind it.
   constexpr std::string_view view() const { return {characters_.data(), Length()}; }
-  constexpr const char* c_str() const { return characters_.data(); }
+  constexpr const char* c_str() const { return characters_.data(); }  // ends with a zero
+  // `capacity` characters and the closing zero.
   constexpr char* data() { return characters_.data(); }
   constexpr bool empty() const { return characters_[0] == '\0'; }
-  static constexpr size_t Capacity() { return capacity; }
+  static constexpr size_t Capacity() { return capacity; }  // characters, without the closing zero
   constexpr operator std::string_view() const { return view(); }  // NOLINT: reads as the text it holds
 
  private:

@@ -24,6 +24,7 @@ struct IniEntry {
 // Walks the entries of one section in file order, also where the section is divided. The text outlives the reader.
 class IniReader {
  public:
+  // Reads one section; the text must outlive it.
   IniReader(std::string_view text, std::string_view section);
   // False at the end of the text.
   bool Next(IniEntry& entry);

@@ -13,7 +13,7 @@ class ProgressSink {
   virtual void Begin() {}
   // `done` of `total` steps, usually rows, are finished.
   virtual void Step(int32_t done, int32_t total) = 0;
-  virtual void End() {}
+  virtual void End() {}  // after the last step, also of work that failed
   // A text of the operation's own, shown in place of the status line.
   virtual void SetText(std::string_view) {}
 };

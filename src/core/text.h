@@ -9,9 +9,10 @@ namespace fotomill {
 // Case of ASCII letters only: extensions and keywords, whatever the user's language.
 constexpr char LowerCase(char c) { return c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c; }
 constexpr char UpperCase(char c) { return c >= 'a' && c <= 'z' ? static_cast<char>(c - 'a' + 'A') : c; }
+// A to Z and a to z only.
 constexpr bool IsLetter(char c) { return LowerCase(c) >= 'a' && LowerCase(c) <= 'z'; }
-std::string LowerCase(std::string_view text);
-std::string UpperCase(std::string_view text);
+std::string LowerCase(std::string_view text);  // other bytes stay
+std::string UpperCase(std::string_view text);  // other bytes stay
 
 // Compares with the case of A to Z ignored; other letters and bytes have to be the same.
 constexpr bool EqualIgnoringCase(std::string_view a, std::string_view b) {

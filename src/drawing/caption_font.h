@@ -15,7 +15,7 @@ namespace fotomill {
 // A font of the system for short lines of text in pictures. Belongs to one thread.
 class CaptionFont {
  public:
-  CaptionFont();
+  CaptionFont();  // has no font until one is opened
   ~CaptionFont();
   CaptionFont(const CaptionFont&) = delete;
   CaptionFont& operator=(const CaptionFont&) = delete;

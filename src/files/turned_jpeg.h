@@ -27,6 +27,7 @@ enum class JpegTurnMethod {
   Tag,      // the orientation of EXIF and XMP alone; everything else is as it was
   Nothing,  // the file says already what it should
 };
+// What came of turning a JPEG file.
 struct JpegTurnResult {
   JpegTurnMethod method = JpegTurnMethod::Nothing;
   RecordedText obstacle;  // why the pixels were not turned, as a sentence

@@ -20,14 +20,16 @@ namespace fotomill {
 inline constexpr uint32_t FMT_BITMAP = 0x1;
 inline constexpr uint32_t FMT_RENDERED = 0x2;  // complete after `info`; `read` is never called
 inline constexpr uint32_t FMT_MULTI = 0x4;     // can hold more than one picture
+// Left out of the destination list unless FMT_SAVE_ANYWAY is set.
 inline constexpr uint32_t FMT_ANIMATED = 0x8;
 inline constexpr uint32_t FMT_CLIPBOARD = 0x20;  // in no list and never matched by extension
-inline constexpr uint32_t FMT_HIDDEN = 0x40;
-inline constexpr uint32_t FMT_PAGES = 0x100;
-inline constexpr uint32_t FMT_TIMED = 0x200;
-inline constexpr uint32_t FMT_FRAMES = 0x400;
+inline constexpr uint32_t FMT_HIDDEN = 0x40;  // left out of other lists of formats
+inline constexpr uint32_t FMT_PAGES = 0x100;  // of those with FMT_MULTI: the pictures are pages
+inline constexpr uint32_t FMT_TIMED = 0x200;  // plays in time: frames or sound
+inline constexpr uint32_t FMT_FRAMES = 0x400;  // of those with FMT_MULTI: the pictures are frames
+// Left out of the open-file filter and the destination list.
 inline constexpr uint32_t FMT_WALLPAPER = 0x800;
-inline constexpr uint32_t FMT_CONTAINER = 0x1000;
+inline constexpr uint32_t FMT_CONTAINER = 0x1000;  // holds whole files
 inline constexpr uint32_t FMT_PNG = 0x2000;
 inline constexpr uint32_t FMT_SOUND = 0x4000;
 inline constexpr uint32_t FMT_LAYERED = 0x8000;
@@ -35,20 +37,23 @@ inline constexpr uint32_t FMT_SECONDARY = 0x10000;  // left out of the destinati
 inline constexpr uint32_t FMT_NO_OPEN = 0x20000;    // left out of the open-file filter
 inline constexpr uint32_t FMT_TRANSPARENT = 0x40000;
 inline constexpr uint32_t FMT_MEDIA = 0x80000;
-inline constexpr uint32_t FMT_MIDI = 0x100000;
+inline constexpr uint32_t FMT_MIDI = 0x100000;  // music as notes
 inline constexpr uint32_t FMT_SPARE = 0x200000;  // free slot for a plug-in format
 inline constexpr uint32_t FMT_FLASH = 0x400000;
-inline constexpr uint32_t FMT_ARCHIVE = 0x800000;
+inline constexpr uint32_t FMT_ARCHIVE = 0x800000;  // an archive of files
 inline constexpr uint32_t FMT_SAVE_ANYWAY = 0x1000000;  // in the destination list whatever else is set
 inline constexpr uint32_t FMT_ALPHA = 0x2000000;        // stores an alpha channel
 
 // Operations of a row. Codecs implement them as plain functions; none of them knows the registry.
 using DetailsOperation = Status (*)(PictureRecord& picture);  // fills `detailLines` of a record that `info` has filled
+// Fills the facts; no pixel is decoded, unless the row is rendered.
 using InfoOperation = Status (*)(PictureRecord& picture, const ReadRequest& request);
+// Fills the pixels.
 using ReadOperation = Status (*)(PictureRecord& picture, const ReadRequest& request);
 using WriteOperation = Status (*)(PictureRecord& picture, const WriteOptions& options);  // to picture.fileName
 using AnimateOperation = Status (*)(const ReadRequest& request, AnimationPointer& animation);  // opens a file's frames
-using LifeOperation = int32_t (*)();
+using LifeOperation = int32_t (*)();  // once for each run of the program
+// Modal over the parent window.
 using OptionsOperation = int32_t (*)(void* parentWindow, int32_t parameter);
 
 // What files of a format begin with: one text, and where that says too little a second one further on.

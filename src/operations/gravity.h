@@ -7,6 +7,7 @@ namespace fotomill {
 
 // Where something lies within something larger: choices of a parameter, in the order of kGravities.
 enum class Gravity : int32_t { Center, Top, Bottom, Left, Right, TopLeft, TopRight, BottomLeft, BottomRight };
+// Words of a choice, in the order of the enumeration.
 inline constexpr const char* kGravities = "center|top|bottom|left|right|top-left|top-right|bottom-left|bottom-right";
 
 // The place of something of size `inner` within `outer`, `margin` pixels away from the edges that it is drawn to. An odd

@@ -46,6 +46,7 @@ struct OperationContext {
   Size whole{0, 0};
   TextExpander expand = {};  // empty: texts are taken as they are
 
+  // A text with its macros replaced by facts of the picture.
   std::string Expanded(const std::string& text, const PictureRecord& picture) const {
     return expand ? expand(text, picture) : text;
   }
@@ -64,8 +65,10 @@ using ReachFunction = int32_t (*)(const Arguments& arguments);
 struct ArgumentProblem {
   std::string parameter, message;
 };
+// Called once each argument is right.
 using CheckFunction = ArgumentProblem (*)(const Arguments& arguments);
 
+// One operation: a constant row.
 struct Operation {
   const char* name;     // lower case, words joined by hyphens
   Family family;

@@ -15,13 +15,13 @@ const Operation* FindOperation(std::string_view name);
 
 // The rows of each family, from its own file in families/.
 std::span<const Operation> CropOperations();
-std::span<const Operation> TransformOperations();
-std::span<const Operation> EffectOperations();
+std::span<const Operation> TransformOperations();  // rotate, flip, resize and the like
+std::span<const Operation> EffectOperations();  // change colors point by point
 std::span<const Operation> PaletteOperations();  // of the family effects, the ones that choose new colors
-std::span<const Operation> FilterOperations();
+std::span<const Operation> FilterOperations();  // look at neighboring pixels
 std::span<const Operation> DistortOperations();  // of the family filter, the ones that bend and scatter
-std::span<const Operation> AnnotateOperations();
-std::span<const Operation> WatermarkOperations();
-std::span<const Operation> MattOperations();
+std::span<const Operation> AnnotateOperations();  // text
+std::span<const Operation> WatermarkOperations();  // a second picture on top
+std::span<const Operation> MattOperations();  // frames and borders
 
 }  // namespace fotomill

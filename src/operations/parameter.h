@@ -45,7 +45,9 @@ struct Parameter {
   const char* keyWords = "";               // choices only: the word for each number of the key from 0, separated by "|"
 };
 
+// What the number of a length counts.
 enum class LengthUnit : uint8_t { Pixels, Percent, Centimeters, Millimeters, Inches };
+// A length as it was written; what it comes to depends on the picture.
 struct Length {
   double number = 0;
   LengthUnit unit = LengthUnit::Pixels;
@@ -53,11 +55,13 @@ struct Length {
   double Pixels(double whole, double dpi) const;
 };
 
+// A color; an alpha of 255 is opaque.
 struct AlphaColor {
   uint8_t red = 0, green = 0, blue = 0, alpha = 255;
   bool operator==(const AlphaColor&) const = default;
 };
 
+// A point of a curve: the input level and what becomes of it, 0 to 255.
 struct CurvePoint {
   double x = 0, y = 0;
 };
@@ -86,6 +90,7 @@ bool ReadColor(std::string_view text, AlphaColor& color);
 
 // Word `index` of a list separated by "|", empty when it has none; and the place of a word, -1 when it is not in the list.
 std::string_view WordOf(std::string_view list, int32_t index);
+// -1 when the list does not have it.
 int32_t PlaceOfWord(std::string_view list, std::string_view word);
 
 // The values of one call: one for each parameter of its operation. Asking for a name that the operation does not have is a
@@ -93,15 +98,18 @@ int32_t PlaceOfWord(std::string_view list, std::string_view word);
 class Arguments {
  public:
   Arguments() = default;
+  // Nothing is given yet; the rows must outlive it.
   explicit Arguments(std::span<const Parameter> rows) : rows_(rows), values_(rows.size()) {}
 
   std::span<const Parameter> Rows() const { return rows_; }
   Value& At(size_t index) { return values_[index]; }
   const Value& At(size_t index) const { return values_[index]; }
-  const Value& Of(std::string_view name) const;
+  const Value& Of(std::string_view name) const;  // by the parameter's name
 
-  bool Has(std::string_view name) const { return Of(name).given; }
+  bool Has(std::string_view name) const { return Of(name).given; }  // written down, or by default
+  // Number, Percent (60 for 60 %) or Angle (degrees).
   double Number(std::string_view name) const { return Of(name).number; }
+  // Cut toward zero.
   int32_t Integer(std::string_view name) const { return static_cast<int32_t>(Of(name).number); }
   bool Flag(std::string_view name) const { return Of(name).choice != 0; }
   template <typename Enum = int32_t>

@@ -39,6 +39,7 @@ struct SaveStep {
   bool operator==(const SaveStep&) const = default;
 };
 
+// One output of a recipe, and the steps that lead to it.
 struct RecipeOutput {
   std::string name;  // empty for the only output of a recipe without any
   std::vector<Step> steps;
@@ -46,13 +47,14 @@ struct RecipeOutput {
   bool hasSave = false;
 };
 
+// What a recipe file says.
 struct Recipe {
   std::vector<Step> common;
   std::vector<RecipeOutput> outputs;  // at least one
 
   // The first operation that is applied; null when the recipe only saves.
   const Operation* First() const;
-  bool HasSteps() const { return First() != nullptr; }
+  bool HasSteps() const { return First() != nullptr; }  // an output has at least one
 };
 
 // What is wrong in a recipe, and where.
@@ -74,7 +76,7 @@ std::vector<Mistake> ReadRecipe(std::string_view text, const KeyValues& keys, Re
 
 // A recipe as text; reading it gives the same recipe. Parameters with their default values are left out.
 std::string PrintRecipe(const Recipe& recipe);
-std::string PrintStep(const Step& step);
+std::string PrintStep(const Step& step);  // one step as the recipe has it
 
 // A step with every parameter at its default. Required parameters have none yet: nothing may run before they are set.
 Step DefaultStep(const Operation& operation, const KeyValues& keys);

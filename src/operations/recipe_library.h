@@ -9,6 +9,7 @@ namespace fotomill {
 // Recipes by name: files "NAME.recipe" in the folder "recipes" of the data folder, and those that come with the program. A
 // file of the same name takes the place of the program's own.
 
+// A recipe of the user's library.
 struct NamedRecipe {
   std::string name;
   std::string path;  // empty: comes with the program

@@ -47,7 +47,7 @@ class Animation {
   size_t next_ = 0;
   Status failure_ = Status::Ok;  // of the last Next
 };
-using AnimationPointer = std::unique_ptr<Animation>;
+using AnimationPointer = std::unique_ptr<Animation>;  // null where there is none
 
 // How long a frame is shown that asks for `delayMs`. One of 10 ms or less stands for 100 ms: old programs wrote such delays
 // knowing that no browser of their time would keep to them, and browsers have done so ever since.

@@ -42,12 +42,13 @@ class PackedImage {
  public:
   static constexpr uint64_t kHeaderSize = 40;
 
-  bool Empty() const { return block_.Empty(); }
-  void Free() { *this = PackedImage(); }
+  bool Empty() const { return block_.Empty(); }  // no block: there is no picture
+  void Free() { *this = PackedImage(); }  // gives the memory back; empty afterwards
 
-  int32_t Width() const { return width_; }
-  int32_t Height() const { return height_; }
-  int32_t Bits() const { return bits_; }
+  int32_t Width() const { return width_; }  // pixels
+  int32_t Height() const { return height_; }  // rows
+  int32_t Bits() const { return bits_; }  // per pixel: 1 to 8, or 24
+  // Entries of the color table, 0 for 24 bits.
   int32_t Colors() const { return bits_ == 24 ? 0 : 1 << bits_; }
   uint64_t Stride() const { return stride_; }  // bytes
 
@@ -63,6 +64,7 @@ class PackedImage {
   std::span<const uint8_t> Bytes() const { return block_.Bytes(); }
   // The color table: Colors() entries of blue, green, red, 0.
   std::span<uint8_t> ColorTable() { return block_.Bytes().subspan(kHeaderSize, RowsOffset() - kHeaderSize); }
+  // Blue, green, red, 0 for each color.
   std::span<const uint8_t> ColorTable() const { return block_.Bytes().subspan(kHeaderSize, RowsOffset() - kHeaderSize); }
 
   // The value at column x, row y from the top: an index, or 0x00RRGGBB of a 24-bit picture; -1 outside the picture.

@@ -48,6 +48,7 @@ struct PictureMetadata {
   std::vector<uint8_t> xmp;   // an XMP packet
   std::vector<uint8_t> icc;   // an ICC profile
   double dpiX = 0, dpiY = 0;  // pixels per inch, 0 when the file does not say
+  // No block; the resolution does not count.
   bool Empty() const { return exif.empty() && xmp.empty() && icc.empty(); }
 };
 
@@ -102,7 +103,7 @@ struct PictureRecord {
   }
 };
 
-using PicturePointer = std::unique_ptr<PictureRecord>;
+using PicturePointer = std::unique_ptr<PictureRecord>;  // owns the record and all that is in it
 
 // A new record with its defaults set: format -1, identity `remap`. Null without memory.
 PicturePointer NewPictureRecord(Color defaultColour = 0xffffff, void* window = nullptr, void* context = nullptr);
@@ -115,6 +116,7 @@ constexpr uint64_t EstimateImageBytes(int32_t width, int32_t height, int32_t bit
 // Begins and ends the progress of one operation on a picture.
 class ProgressScope {
  public:
+  // The picture must outlive it.
   explicit ProgressScope(const PictureRecord& picture) : sink_(picture.progress) {
     if (sink_ != nullptr) sink_->Begin();
   }

@@ -20,6 +20,7 @@ struct WriteOptions {
   std::string password = {};           // for formats that can be protected; empty: none
   std::function<bool()> makeWay = {};  // called when the new file is whole, before it gets its name; false: it never does
 
+  // By the call and by the settings.
   bool KeepsMetadata() const { return keepMetadata && encode.preserveMetadata; }
 };
 

@@ -22,15 +22,16 @@ class FileView {
 
   // Opens `path` for reading. False when it is missing, not a regular file, not readable, or there is no memory for it.
   [[nodiscard]] bool Open(const char* path);
+  // Closes what was open before.
   [[nodiscard]] bool Open(const std::string& path) { return Open(path.c_str()); }
   // Opens `path` but makes only its first `count` bytes visible; FileSize() still tells the whole length. For headers.
   [[nodiscard]] bool OpenHead(const char* path, uint64_t count);
-  void Close();
+  void Close();  // spans into the file end here
 
   // What is visible, until Close or another Open; and the length of the whole file when it was
   // opened.
   std::span<const uint8_t> Bytes() const { return {data_, static_cast<size_t>(size_)}; }
-  uint64_t FileSize() const { return fileSize_; }
+  uint64_t FileSize() const { return fileSize_; }  // bytes when it was opened
   // Copies the bytes of the file from `offset` on into `into`, also those that OpenHead left out, without making them a
   // part of the view: the cheapest way to a block that holds them anyway. False when the file ends before, or on an error.
   [[nodiscard]] bool ReadAt(uint64_t offset, std::span<uint8_t> into) const;

@@ -26,8 +26,8 @@ struct FileFacts {
 // the way may not be searched) is Other: nobody may take it for free.
 FileFacts FactsOf(const std::string& path);
 bool FileExists(const std::string& path);  // anything of that name, a dangling link included
-bool IsRegularFile(const std::string& path);
-bool IsFolder(const std::string& path);
+bool IsRegularFile(const std::string& path);  // links are followed
+bool IsFolder(const std::string& path);  // links are followed
 
 // Names in a folder, without "." and "..", in byte order. nullopt when it cannot be read.
 struct FolderEntry {
@@ -59,7 +59,7 @@ bool HasTrash(const std::string& path);
 // The attribute that keeps a file out of listings. Where hidden is what begins with a dot, SetHidden answers true and
 // changes nothing.
 [[nodiscard]] bool SetHidden(const std::string& path, bool hidden);
-bool IsHidden(const std::string& path);
+bool IsHidden(const std::string& path);  // a leading dot, or the system's attribute
 // Clears hidden and read-only.
 [[nodiscard]] bool SetNormal(const std::string& path);
 // A file's modification time, as finely as the system keeps it.
@@ -70,6 +70,7 @@ struct ExactTime {
 // Of the file that a path leads to, through links. nullopt and false when it is not there or not
 // ours to change.
 std::optional<ExactTime> ModificationTime(const std::string& path);
+// False when the system refuses.
 [[nodiscard]] bool SetModificationTime(const std::string& path, ExactTime time);
 // Gives a file the modification time of another, as finely as the system keeps it.
 [[nodiscard]] bool CopyTimes(const std::string& from, const std::string& to);

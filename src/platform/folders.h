@@ -24,8 +24,8 @@ std::string UserFullName();
 
 // The running program's own file and its folder, links resolved.
 std::string ProgramPath();
-std::string ProgramFolder();
-std::string CurrentFolder();
+std::string ProgramFolder();  // the folder of the running program's file
+std::string CurrentFolder();  // absolute
 // A relative path made absolute against the current folder, with "." and ".." taken out and no closing separator; links
 // stay. Without a current folder (it was deleted) a relative path comes back as it is.
 std::string AbsolutePath(const std::string& path);

@@ -29,13 +29,13 @@ class MemoryBlock {
   [[nodiscard]] bool Allocate(uint64_t size, Fill fill = Fill::Zero);
   // Grows or shrinks, keeping the contents up to the smaller size; new bytes are zero. False leaves the block unchanged.
   [[nodiscard]] bool Resize(uint64_t size);
-  void Free();
+  void Free();  // into the pool, or back to the system
 
   // The block as it is: null and of size 0 when nothing is allocated. Pointers and spans hold until
   // Allocate, Resize or Free.
   bool Empty() const { return data_ == nullptr; }
-  uint64_t Size() const { return size_; }
-  uint8_t* Data() { return data_; }
+  uint64_t Size() const { return size_; }  // bytes, 0 without a block
+  uint8_t* Data() { return data_; }  // null without a block
   const uint8_t* Data() const { return data_; }
   std::span<uint8_t> Bytes() { return {data_, static_cast<size_t>(size_)}; }
   std::span<const uint8_t> Bytes() const { return {data_, static_cast<size_t>(size_)}; }

@@ -10,8 +10,8 @@ namespace fotomill::platform {
 
 // The bytes behind a handle, empty when it cannot be locked. Valid until UnlockModuleBlock.
 std::span<uint8_t> LockModuleBlock(void* handle);
-void UnlockModuleBlock(void* handle);
-void FreeModuleBlock(void* handle);
+void UnlockModuleBlock(void* handle);  // the bytes may move from here on
+void FreeModuleBlock(void* handle);  // the handle means nothing afterwards
 // A new block with a copy of `bytes`, null without memory.
 void* NewModuleBlock(std::span<const uint8_t> bytes);
 

@@ -40,7 +40,7 @@ class OutputFile {
   // Gives the file its name. `sync` asks the system to have the contents on disk first; a file that replaces another
   // is always synced. After anything but Done there is no new file; Commit cannot be tried again.
   [[nodiscard]] CommitResult Commit(Existing existing, bool sync = false);
-  void Discard();
+  void Discard();  // deletes what was written; the destination stays as it was
 
  private:
   bool CreateNamedSibling(unsigned mode);

@@ -16,6 +16,7 @@ struct PathParts {
 // Splits at the last separator and the last dot behind it, and puts parts together again. Nothing
 // is asked of the system.
 PathParts SplitPath(std::string_view path);
+// The parts in their order, with nothing in between.
 std::string JoinPath(const PathParts& parts);
 // `folder` and `name` with one separator between them; an empty folder gives the name alone.
 std::string JoinFolder(std::string_view folder, std::string_view name);

@@ -31,6 +31,6 @@ unsigned CoreCount();  // cores this process may use, at least 1
 // the program at once; temporary files go all the same. A request that was ignored when the program started (nohup) stays
 // ignored. Writing to a pipe that nobody reads any more fails from here on, instead of ending the program.
 void CatchTermination();
-int PendingExit();
+int PendingExit();  // 130 or 143; 0 while nothing was asked
 
 }  // namespace fotomill::platform

@@ -20,11 +20,11 @@ class ReservedMemory {
 
   // Replaces the room by `size` zero bytes. False, with the room unchanged, if there is no address space.
   [[nodiscard]] bool Reserve(uint64_t size);
-  void Free();
+  void Free();  // gives the address space back
 
   // Whether nothing is reserved, and how many bytes are.
   bool Empty() const { return data_ == nullptr; }
-  uint64_t Size() const { return size_; }
+  uint64_t Size() const { return size_; }  // bytes
   // `count` plain structures from a byte offset on, which the caller keeps inside the room.
   template <typename T>
   std::span<T> Items(uint64_t offset, size_t count) {

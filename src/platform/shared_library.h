@@ -16,17 +16,19 @@ class SharedLibrary {
   [[nodiscard]] bool Load(const std::string& absolutePath);
   // Loads one of the system's own libraries by its bare name ("libjxr.so.0"), wherever the system keeps them.
   [[nodiscard]] bool LoadSystem(const std::string& name);
-  bool Loaded() const { return handle_ != nullptr; }
+  bool Loaded() const { return handle_ != nullptr; }  // after Load went well
   // An export's address, null when it has none of that name.
   void* Symbol(const char* name) const;
+  // Null when the library has no such function.
   template <typename Function>
   Function* FunctionNamed(const char* name) const {
     return reinterpret_cast<Function*>(Symbol(name));
   }
   // The system's handle, null without a module, and the system's words on why the last Load failed.
   void* Handle() const { return handle_; }
+  // The system's words for what Load could not do.
   const std::string& Error() const { return error_; }
-  void Unload();
+  void Unload();  // its functions must not be called any more
 
  private:
   void* handle_ = nullptr;

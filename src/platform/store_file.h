@@ -20,26 +20,27 @@ class StoreFile {
   // Opens a regular file; links are followed for reading only. A link that leads nowhere is Failed, not Missing: who makes
   // a new store where one merely could not be opened loses the old one.
   OpenResult Open(const std::string& path, Mode mode);
-  void Close();
-  bool IsOpen() const { return handle_ != -1; }
+  void Close();  // the lock goes with it
+  bool IsOpen() const { return handle_ != -1; }  // after Open was Done
 
   // Bytes that the file has now, whoever wrote them; 0 when it cannot be asked.
   uint64_t Size() const;
   int64_t Modified() const;  // nanoseconds since 1970, as precise as the system keeps it
   // All or nothing: false when fewer bytes were read or written.
   [[nodiscard]] bool ReadAt(uint64_t offset, std::span<uint8_t> bytes) const;
+  // The file grows where it has to.
   [[nodiscard]] bool WriteAt(uint64_t offset, std::span<const uint8_t> bytes);
   // The same with bytes that are in two places, one after the other in the file.
   [[nodiscard]] bool ReadAt(uint64_t offset, std::span<uint8_t> first, std::span<uint8_t> second) const;
   [[nodiscard]] bool WriteAt(uint64_t offset, std::span<const uint8_t> first, std::span<const uint8_t> second);
-  [[nodiscard]] bool Sync();
+  [[nodiscard]] bool Sync();  // what was written outlasts a power failure from here on
   // Cuts the file to that size, or makes it longer with zeros.
   [[nodiscard]] bool Resize(uint64_t size);
   // Waits for the exclusive lock on the file, which two StoreFiles never hold together, in one process or in two. Advisory
   // between programs that ask for it. False when it cannot be had, when the program was asked to end meanwhile, and after ten
   // seconds; only then a reason is kept, which names the holder.
   [[nodiscard]] bool Lock();
-  void Unlock();
+  void Unlock();  // others may go on
   // Says until Close that the file is in use, which any number of StoreFiles may; and whether others say so. Apart from Lock.
   // Where locks do not work nothing is in use.
   bool MarkInUse();
@@ -57,6 +58,7 @@ class StoreFile {
 // Holds a lock for a scope.
 class StoreLock {
  public:
+  // Waits as StoreFile::Lock.
   explicit StoreLock(StoreFile& file) : file_(file), held_(file.Lock()) {}
   ~StoreLock() {
     if (held_) file_.Unlock();

@@ -27,13 +27,14 @@ class TemporaryFile {
   // under a second name where the file system can, else a copy of it with its time. Who replaces `path` by a new file leaves this
   // one as it is. False when that is not possible; a file that was held before is gone then too.
   [[nodiscard]] bool Keep(const std::string& path, const std::string& folder);
+  // Each owns the other's file.
   void Swap(TemporaryFile& other) {
     std::swap(path_, other.path_);
     std::swap(listed_, other.listed_);
   }
   // Where the file is; empty if there is none. Delete may be called at any time.
   const std::string& Path() const { return path_; }
-  void Delete();
+  void Delete();  // does nothing where nothing is kept
 
  private:
   std::string path_;

@@ -17,7 +17,7 @@ class SharedBlock {
 
   // False if there is no memory. Once for each block.
   [[nodiscard]] bool Allocate(uint64_t size);
-  std::span<uint8_t> Bytes() { return {data_, static_cast<size_t>(size_)}; }
+  std::span<uint8_t> Bytes() { return {data_, static_cast<size_t>(size_)}; }  // empty until Allocate
   std::span<const uint8_t> Bytes() const { return {data_, static_cast<size_t>(size_)}; }
   // The system's number of the block, for the process apart.
   intptr_t SystemHandle() const { return handle_; }
@@ -35,7 +35,7 @@ struct ApartCall {
   std::span<uint8_t> reply;          // a shared block of the caller
   std::function<void(int32_t)> tell;  // numbers for the caller, meanwhile
 };
-inline constexpr size_t kMostRequest = 4096;
+inline constexpr size_t kMostRequest = 4096;  // bytes
 
 // A kind of work that may run apart: one row of the program's table.
 struct ApartTask {
@@ -48,6 +48,7 @@ struct ApartTask {
 // until nobody asks any more, and returns the exit status.
 std::optional<int> ServeApart(int count, const char* const* arguments, std::span<const ApartTask> tasks);
 
+// How work apart ended.
 enum class ApartResult {
   Done,        // the work answered true
   Failed,      // it answered false, or ran out of the memory that it was given
@@ -56,6 +57,7 @@ enum class ApartResult {
   NotStarted,  // the system has no room for it, or the program does not serve
 };
 
+// What is to be done apart, with what, and within which limits.
 struct ApartOrder {
   const char* task;  // its name in the table
   std::span<const uint8_t> request = {};

@@ -34,7 +34,7 @@ struct PluginEntry {
   uint32_t flags1 = 0;  // deepest picture that the writer takes, bits per pixel
   uint32_t flags2 = 0;  // capability bits of the format row, always with FMT_SPARE
 };
-static_assert(sizeof(void*) != 4 || sizeof(PluginEntry) == 1088);
+static_assert(sizeof(void*) != 4 || sizeof(PluginEntry) == 1088);  // as 32-bit plug-ins see it
 
 // At most this many formats of one module are registered.
 inline constexpr int32_t kFormatsPerModule = 32;
@@ -52,7 +52,7 @@ struct PluginModule {
 std::vector<PluginModule> PluginModules(const std::string& folder = {});
 // The modules that are off, by file name; all others are on.
 void SetModulesOff(std::vector<std::string> names);
-void SwitchModule(const std::string& name, bool on);
+void SwitchModule(const std::string& name, bool on);  // by file name; from the next scan on
 // Unloads every module; formats that are bound to a row must not be used afterwards.
 void UnloadPlugins();
 
@@ -62,7 +62,8 @@ int32_t PluginFormatCount();
 const PluginEntry& PluginRow(int32_t index);
 // The extension of a row, and the deepest picture that it writes when it can write at all (else 0). False beyond the end.
 bool PluginExtension(int32_t index, std::string& extension, uint32_t& flags1);
-bool PluginTextA(int32_t index, std::string& text);
+bool PluginTextA(int32_t index, std::string& text);  // the row's first text; false beyond the end
+// The second one: the module's description of its formats.
 bool PluginTextB(int32_t index, std::string& text);
 // The first entry that serves a file's extension, ignoring case; null when none does.
 const PluginEntry* FindPluginEntry(std::string_view fileName);

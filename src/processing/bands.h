@@ -12,7 +12,7 @@ struct Work {
   uint32_t threads = 1;               // 1: on the calling thread; 0: on all cores that are free. Results never depend on it
   std::function<bool()> goesOn = {};  // asked between bands; false: stop. Empty: never stop
 
-  bool GoesOn() const { return !goesOn || goesOn(); }
+  bool GoesOn() const { return !goesOn || goesOn(); }  // false once the caller has given up
 };
 
 // Rows first to end - 1 of a result.

@@ -48,10 +48,10 @@ class ColorSet {
  public:
   static constexpr int32_t kMost = 256;
 
-  ColorSet() { slots_.fill(kFree); }
+  ColorSet() { slots_.fill(kFree); }  // empty
   // Takes in the pixels of a row, blue, green, red. False, at once, when there are more than `most` colors.
   bool AddRow(const uint8_t* bgr, int32_t width, int32_t most = kMost);
-  int32_t Count() const { return count_; }
+  int32_t Count() const { return count_; }  // different colors so far
   // Puts the colors into order of brightness, numbers them, and writes them to `palette`, black behind the last.
   void Number(Palette& palette);
   // The number of a color, 0x00RRGGBB, that is in the set.

@@ -10,8 +10,8 @@
 
 namespace fotomill {
 
-inline constexpr int32_t kSpareRow = 77;
-inline constexpr int32_t formatCount = 78;
+inline constexpr int32_t kSpareRow = 77;  // number of SpareRow
+inline constexpr int32_t formatCount = 78;  // rows, the spare one included
 using FormatTable = std::array<FormatEntry, formatCount>;
 
 // The rows as the families of codecs export them, in the order of formats/families.def. They live as long as the program.

@@ -32,6 +32,7 @@ struct PluginFormatFacts {
   uint32_t maxBits = 0;   // deepest picture that it writes
   bool canWrite = false;
 };
+// The loader's answers; installed once.
 struct PluginSource {
   // Binds the format of a file's extension to this thread's spare row; its index, or kNoFormat.
   int32_t (*bind)(std::string_view fileName, int32_t parameter);
@@ -41,23 +42,23 @@ struct PluginSource {
 void InstallPluginSource(const PluginSource* source);  // not owned; null removes it
 // The plug-in fallback of FindFormatByName.
 int32_t FindPluginFormat(std::string_view fileName, int32_t parameter = 0);
-std::vector<PluginFormatFacts> PluginFormats();
+std::vector<PluginFormatFacts> PluginFormats();  // of the installed source; empty without one
 // How lists show a plug-in format: "(EXT) Plugin", followed by a blank and the module's text when it has one.
 std::string PluginDescription(const PluginFormatFacts& format);
 
 // Whether pictures of a row can be read and written on this machine.
 bool CanRead(const FormatEntry& row);
-bool CanWrite(const FormatEntry& row);
+bool CanWrite(const FormatEntry& row);  // a library that is missing here counts
 // Why a row cannot be read or cannot be written here, in one sentence; empty when both work.
 std::string_view WhyNot(const FormatEntry& row);
 
 // What the codecs of all families have to be set and are built with, in the order of formats/families.def, each once.
 std::vector<const FormatSettings*> SettingsOfFormats();
-std::vector<FormatLibrary> LibrariesOfFormats();
+std::vector<FormatLibrary> LibrariesOfFormats();  // each once
 
 // Call `startup`, or `shutdown`, of every row that has one, in row order.
 void RunFormatStartup();
-void RunFormatShutdown();
+void RunFormatShutdown();  // after the last picture
 
 // Opens and decodes what is asked for into a new record: finds its row, runs `info` and, for rows that are not rendered,
 // `read`. UnsupportedFormat (8) when no row matches, else the codec's own status; `picture` is null unless Ok.

@@ -16,7 +16,7 @@ struct FileKind {
   bool IsOf(std::string_view extension) const;
 };
 
-inline constexpr size_t kSignatureBytes = 32;
+inline constexpr size_t kSignatureBytes = 32;  // so many from the start of a file decide
 
 // Recognises a file by its first kSignatureBytes bytes (fewer when it is shorter), by the longest signature that fits.
 FileKind IdentifySignature(std::span<const uint8_t> head);

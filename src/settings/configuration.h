@@ -19,7 +19,7 @@ namespace fotomill {
 
 // The file's name in the data folder, and the section that holds the keys.
 inline constexpr std::string_view kConfigurationFile = "Fotomill Professional 11.ini";
-inline constexpr std::string_view kConfigurationSection = "Fotomill";
+inline constexpr std::string_view kConfigurationSection = "Fotomill";  // of the INI file
 
 // Path of the configuration file, whether it is there or not; empty without a data folder.
 std::string ConfigurationPath();
@@ -45,7 +45,7 @@ struct ValueComplaint {
 ConfigurationState LoadConfiguration();
 // What the last load found.
 ConfigurationState StateOfConfiguration();
-std::span<const ValueComplaint> ConfigurationComplaints();
+std::span<const ValueComplaint> ConfigurationComplaints();  // of the last loading
 
 // What became of a value given by name.
 struct SetResult {

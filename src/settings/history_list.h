@@ -30,7 +30,7 @@ std::vector<std::string> LoadHistoryList(HistoryList list);
 [[nodiscard]] bool AddToHistoryList(HistoryList list, std::string_view entry);
 // Takes an entry out; true as well when it was not there.
 [[nodiscard]] bool RemoveFromHistoryList(HistoryList list, std::string_view entry);
-[[nodiscard]] bool ClearHistoryList(HistoryList list);
+[[nodiscard]] bool ClearHistoryList(HistoryList list);  // false when the list cannot be written
 
 // An entry of the File menu: "FileMenuHistory.txt" holds lines "PATH,NUMBER", RecentFilesMaximum of them.
 struct RecentFile {

@@ -18,7 +18,7 @@ struct ThumbnailUpdateOptions;
 
 // What codecs depend on, by the keys that the structs name. A new key of a codec is one field there and one line here.
 ReadOptions ReadOptionsFromSettings();
-EncodeOptions EncodeOptionsFromSettings();
+EncodeOptions EncodeOptionsFromSettings();  // the keys that EncodeOptions names
 
 // FXColorDither and FXMonoDither (other numbers than those of the lists as the last one), FXBidirectional, FXMonomode,
 // FXGrayLevel, FXThreshold, DitherBrightness and DitherContrast, each clamped to its range.
@@ -31,9 +31,9 @@ choice::DistanceUnit DistanceUnitFromSettings();
 // ExifDefaultLocation. False, with `location` at zero, when it holds no location.
 [[nodiscard]] bool GpsLocationFromSettings(GpsLocation& location);
 
-HistoryOptions HistoryOptionsFromSettings();
-ThumbnailOptions ThumbnailOptionsFromSettings();
-ThumbnailUpdateOptions ThumbnailUpdateOptionsFromSettings();
+HistoryOptions HistoryOptionsFromSettings();  // the keys that HistoryOptions names
+ThumbnailOptions ThumbnailOptionsFromSettings();  // the keys that ThumbnailOptions names
+ThumbnailUpdateOptions ThumbnailUpdateOptionsFromSettings();  // the keys that it names
 // Takes up what the user chose in the offer to update thumbnails.
 void StoreThumbnailUpdate(const ThumbnailUpdateOptions& options);
 

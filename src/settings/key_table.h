@@ -43,7 +43,8 @@ struct KeyRow {
   uint32_t control;  // number of the Setup control, 0 for none
   KeyExtra extra;
 };
-static_assert(sizeof(void*) != 4 || sizeof(KeyRow) == 20);
+static_assert(sizeof(void*) != 4 || sizeof(KeyRow) == 20);  // as 32-bit plug-ins see it
+// No padding, wherever pointers are wider.
 static_assert(offsetof(KeyRow, type) == 2 * sizeof(void*) && offsetof(KeyRow, extra) == 2 * sizeof(void*) + 8);
 
 // The place of every key in the table, by name.
@@ -64,7 +65,7 @@ struct KeyTable {
 // Laid out for plug-ins; the program itself goes through the functions below.
 extern const KeyTable keyTable;
 
-inline std::span<const KeyRow> Keys() { return keyTable.rows; }
+inline std::span<const KeyRow> Keys() { return keyTable.rows; }  // in table order
 inline const KeyRow& KeyOf(KeyNumber number) { return keyTable.rows[static_cast<size_t>(number)]; }
 // The place of a row, or of the row that this one is a copy of.
 size_t NumberOfKey(const KeyRow& row);
@@ -79,10 +80,10 @@ std::string_view NearestKey(std::string_view typed);
 
 // The value in force and the built-in default. NumberIn is for keys without KEY_TEXT, TextIn for those with it.
 int32_t NumberIn(const KeyRow& row);
-std::string_view TextIn(const KeyRow& row);
+std::string_view TextIn(const KeyRow& row);  // of the key's variable now
 int32_t DefaultNumber(const KeyRow& row);
 std::string_view DefaultText(const KeyRow& row);
-bool IsAtDefault(const KeyRow& row);
+bool IsAtDefault(const KeyRow& row);  // its value is the default's
 // The longest text that the key holds, in bytes.
 size_t TextLimit(const KeyRow& row);
 // Whether the text becomes part of a file name, so that it may not lead anywhere.
@@ -92,7 +93,7 @@ bool IsLooseFlag(const KeyRow& row);
 
 // Store a value as it is; a text that is too long is cut.
 void StoreNumber(const KeyRow& row, int32_t number);
-void StoreText(const KeyRow& row, std::string_view text);
-void StoreDefault(const KeyRow& row);
+void StoreText(const KeyRow& row, std::string_view text);  // a text that is too long is cut
+void StoreDefault(const KeyRow& row);  // number or text
 
 }  // namespace fotomill

@@ -21,6 +21,7 @@ CarryOver CarryOverDataFolder(const std::string& previous, const std::string& cu
 
 // What CarryOverDataFolder looks for in the old folder, the patterns divided by semicolons.
 inline constexpr std::string_view kPreviousConfigurationFile = "Fotomill Professional 10.ini";
+// Taken over as they are.
 inline constexpr std::string_view kCarriedFiles = "*.browser;*.txt;Fotomill.tdb;FMWFileHistoryDatabase.fhdb;*.ccl;*.list";
 
 }  // namespace fotomill

@@ -45,7 +45,7 @@ bool HoldsValue(const KeyRow& row, const SettingValue& value);
 
 // The value in force, or the default, as the configuration file holds it.
 std::string ValueText(const KeyRow& row);
-std::string DefaultValueText(const KeyRow& row);
+std::string DefaultValueText(const KeyRow& row);  // as the file would say it
 
 // What the key takes, for people: "PngCompression takes a number from 0 to 9." Empty without a fault.
 std::string FaultMessage(const KeyRow& row, ValueFault fault);

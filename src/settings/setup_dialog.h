@@ -20,19 +20,19 @@ class SetupDialog {
   // Whether the dialog has that control. The rest is asked of those that it has only.
   virtual bool Has(uint32_t control) const = 0;
 
-  virtual void SetChecked(uint32_t control, bool checked) = 0;
+  virtual void SetChecked(uint32_t control, bool checked) = 0;  // a check box or radio button
   virtual bool IsChecked(uint32_t control) const = 0;
   // Of an edit field, or of any control that shows a text.
   virtual void SetText(uint32_t control, std::string_view text) = 0;
-  virtual std::string Text(uint32_t control) const = 0;
-  virtual void LimitText(uint32_t control, size_t bytes) = 0;
-  virtual void SetRange(uint32_t control, const SpinRange& range) = 0;
+  virtual std::string Text(uint32_t control) const = 0;  // what SetText has set, or the user
+  virtual void LimitText(uint32_t control, size_t bytes) = 0;  // no more can be typed
+  virtual void SetRange(uint32_t control, const SpinRange& range) = 0;  // of a spin control
   virtual void SetColour(uint32_t control, int32_t color) = 0;  // 0x00BBGGRR
-  virtual int32_t Color(uint32_t control) const = 0;
+  virtual int32_t Color(uint32_t control) const = 0;  // 0x00BBGGRR
   // A combo or list box; positions count from 0, -1 is none.
   virtual void SetChoices(uint32_t control, std::span<const std::string> texts) = 0;
-  virtual void Select(uint32_t control, int32_t position) = 0;
-  virtual int32_t Selected(uint32_t control) const = 0;
+  virtual void Select(uint32_t control, int32_t position) = 0;  // -1: nothing
+  virtual int32_t Selected(uint32_t control) const = 0;  // -1: nothing
 };
 
 // What a combo of destination formats offers: extensions in the order in which they are shown.
@@ -71,6 +71,6 @@ bool TakeSetupChanged();
 
 // The help page for a control: the name of its key, or that of the page about Setup as a whole.
 std::string_view HelpPageFor(uint32_t control);
-inline constexpr std::string_view kGeneralHelpPage = "configuration";
+inline constexpr std::string_view kGeneralHelpPage = "configuration";  // about Setup as a whole
 
 }  // namespace fotomill

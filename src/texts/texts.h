@@ -22,7 +22,7 @@ class TextArgument {
   TextArgument(const std::string& text) : text_(text) {}
   TextArgument(std::integral auto number) : text_(std::to_string(number)) {}
 
-  const std::string& Text() const { return text_; }
+  const std::string& Text() const { return text_; }  // digits of a number, without separators
 
  private:
   std::string text_;
@@ -30,11 +30,12 @@ class TextArgument {
 
 // The translation of a whole text, itself when there is none.
 const char* Tr(const char* text);
-std::string Tr(std::string_view text);
+std::string Tr(std::string_view text);  // for texts that are not literals
 inline std::string Tr(const std::string& text) { return Tr(std::string_view(text)); }
 
 // The same with %1, %2, ... replaced by the arguments.
 std::string TrArguments(const char* text, std::initializer_list<TextArgument> arguments);
+// The translation with its arguments put in.
 template <typename... Arguments>
   requires(sizeof...(Arguments) > 0)
 std::string Tr(const char* text, const Arguments&... arguments) {
@@ -43,6 +44,7 @@ std::string Tr(const char* text, const Arguments&... arguments) {
 
 // The form of a text that a count asks for. The count is %1, with thousands separated; the arguments follow as %2, ...
 std::string TrCountArguments(const char* one, const char* many, uint64_t count, std::initializer_list<TextArgument> arguments);
+// The same with any number of arguments.
 template <typename... Arguments>
 std::string TrCount(const char* one, const char* many, uint64_t count, const Arguments&... arguments) {
   return TrCountArguments(one, many, count, {TextArgument(arguments)...});
@@ -55,7 +57,9 @@ struct RecordedText {
   bool empty() const { return english.empty(); }
   void Append(const RecordedText& more);  // behind a blank
 };
+// English and translation at once.
 RecordedText TrRecordedArguments(const char* text, std::initializer_list<TextArgument> arguments);
+// The same with any number of arguments.
 template <typename... Arguments>
 RecordedText TrRecorded(const char* text, const Arguments&... arguments) {
   return TrRecordedArguments(text, {TextArgument(arguments)...});
@@ -63,7 +67,7 @@ RecordedText TrRecorded(const char* text, const Arguments&... arguments) {
 
 // Numbers for people, with the separators of the language: "12,345", "1.5".
 std::string ThousandsText(uint64_t number);
-std::string DecimalText(double number, int digits);
+std::string DecimalText(double number, int digits);  // so many digits behind the decimal separator
 
 // Marks a text in a table for translation; whoever shows it calls Tr.
 constexpr const char* TrLater(const char* text) { return text; }

@@ -42,7 +42,7 @@ enum class FileFunction : int32_t {
 };
 // How many functions there are, and the number of none.
 inline constexpr int32_t kFileFunctionCount = 20;
-inline constexpr int32_t kNoFileFunction = -1;
+inline constexpr int32_t kNoFileFunction = -1;  // an entry without a function
 
 // What the history is to hold: the FileHistory... keys.
 struct HistoryOptions {

@@ -35,10 +35,10 @@ namespace fotomill {
 // The global database is in the data folder, a local one in the folder of its pictures. A record is written and on disk
 // before the header counts it; what is behind the counted ones means nothing.
 inline constexpr size_t kDatabaseHeaderSize = 60;
-inline constexpr size_t kDatabaseRecordSize = 28442;
-inline constexpr std::string_view kDatabaseMagic = "BRNTTDBX";
-inline constexpr uint32_t kDatabaseVersion = 0x01600100;
-inline constexpr std::string_view kDatabaseName = "Fotomill.tdb";
+inline constexpr size_t kDatabaseRecordSize = 28442;  // bytes
+inline constexpr std::string_view kDatabaseMagic = "BRNTTDBX";  // at the start of the file
+inline constexpr uint32_t kDatabaseVersion = 0x01600100;  // of databases made now
+inline constexpr std::string_view kDatabaseName = "Fotomill.tdb";  // file name in its folder
 
 // The header, without its magic.
 struct DatabaseHeader {
@@ -96,7 +96,7 @@ class ThumbnailDatabase {
   // Opens the database of that path; with `create`, one that is missing is made with an empty header. With `hidden`
   // what is made, now or later, is hidden.
   Opened OpenThumbnailDatabase(const std::string& path, bool create, bool hidden = true);
-  void CloseThumbnailDatabase();
+  void CloseThumbnailDatabase();  // does nothing when none is open
 
   // False when the file is shorter than a header or not a database.
   bool ReadDatabaseHeader(DatabaseHeader& header) const;

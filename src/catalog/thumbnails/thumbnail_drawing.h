@@ -31,7 +31,8 @@ bool DrawThumbnailRecord(PackedImage& bitmap, const AnyThumbnailRecord& record, 
 // Fills a record with one of the two pictures that stand for a thumbnail that is not there: 9501, one can still be
 // made; 9502, none can. False for another number.
 inline constexpr int32_t kPlaceholderNotMade = 9501;
-inline constexpr int32_t kPlaceholderUnreadable = 9502;
+inline constexpr int32_t kPlaceholderUnreadable = 9502;  // none can be made
+// `which`: one of the two numbers above.
 bool MakePlaceholderRecord(ThumbnailRecord& record, int32_t which, Color matte);
 
 }  // namespace fotomill

@@ -44,7 +44,7 @@ class ThumbnailIndex {
 
   // Forgets all records, and how many there are, those that cannot be found included.
   void Clear();
-  size_t Count() const { return hashes_.size(); }
+  size_t Count() const { return hashes_.size(); }  // those that cannot be found included
   // Takes in the next record: its hash, or 0 for one that cannot be found.
   void Append(uint32_t hash);
   // Gives a record another hash; 0 takes it out.

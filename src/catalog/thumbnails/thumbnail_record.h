@@ -25,11 +25,11 @@ struct PictureRecord;
 // The picture is in the middle, offsets rounded down; the rest has the background's color. Small records of versions
 // below 2 hold 96 x 96 indices into ThumbnailPalette() instead, in the same order of rows.
 inline constexpr size_t kThumbnailHeaderSize = 264;
-inline constexpr int16_t kThumbnailVersion = 512;
-inline constexpr int32_t kSmallThumbnailSide = 96;
-inline constexpr int32_t kLargeThumbnailSide = 176;
-inline constexpr std::string_view kSmallThumbnailMagic = "THNL";
-inline constexpr std::string_view kLargeThumbnailMagic = "tHNL";
+inline constexpr int16_t kThumbnailVersion = 512;  // of records written now
+inline constexpr int32_t kSmallThumbnailSide = 96;  // pixels
+inline constexpr int32_t kLargeThumbnailSide = 176;  // pixels
+inline constexpr std::string_view kSmallThumbnailMagic = "THNL";  // with kSmallThumbnailSide
+inline constexpr std::string_view kLargeThumbnailMagic = "tHNL";  // with kLargeThumbnailSide
 
 // A record of either size. It holds its bytes as they are in a file.
 template <int32_t side>
@@ -40,6 +40,7 @@ struct SquareThumbnailRecord {
 
   // The header's fields; a record that was never signed has version 0 and no magic.
   int16_t Version() const { return static_cast<int16_t>(bytes[4] | bytes[5] << 8); }
+  // Of four characters.
   bool HasMagic(std::string_view magic) const {
     for (size_t i = 0; i < magic.size(); ++i) {
       if (bytes[i] != static_cast<uint8_t>(magic[i])) return false;
@@ -63,6 +64,7 @@ struct SquareThumbnailRecord {
   std::span<uint8_t> StoredRow(int32_t r) {
     return std::span(bytes).subspan(kThumbnailHeaderSize + static_cast<size_t>(r) * kStride, kStride);
   }
+  // Row r from the bottom: blue, green, red.
   std::span<const uint8_t> StoredRow(int32_t r) const {
     return std::span(bytes).subspan(kThumbnailHeaderSize + static_cast<size_t>(r) * kStride, kStride);
   }
@@ -70,6 +72,7 @@ struct SquareThumbnailRecord {
 // The small record, of files and the database, and the large one, of the large view.
 using ThumbnailRecord = SquareThumbnailRecord<kSmallThumbnailSide>;
 using LargeThumbnailRecord = SquareThumbnailRecord<kLargeThumbnailSide>;
+// As in files.
 static_assert(sizeof(ThumbnailRecord) == 27912 && sizeof(LargeThumbnailRecord) == 93192);
 
 // The palette of old records: 3 bits of red, 3 of green, 2 of blue.
@@ -89,6 +92,7 @@ bool MakeLargeThumbnailRecord(LargeThumbnailRecord& record, const PictureRecord&
 
 // A new 24-bit bitmap with the record's pixels. Statuses as NewPackedImage.
 Status ThumbnailRecordToBitmap(const ThumbnailRecord& record, PackedImage& bitmap);
+// The same for a large record.
 Status ThumbnailRecordToBitmap(const LargeThumbnailRecord& record, PackedImage& bitmap);
 
 }  // namespace fotomill

@@ -39,13 +39,17 @@ struct ThumbnailBrowser {
 // Values of UpdateThumbnailsOptions and the texts of the box "Update Thumbnails", which shows ThumbnailUpdateQuestion,
 // kThumbnailUpdateRequest and these choices.
 inline constexpr int32_t kUpdateCreate = 101, kUpdateLater = 102, kUpdateNotHere = 103, kUpdateNever = 104;
+// One of the answers that the offer lets the user choose.
 struct ThumbnailUpdateChoice {
   int32_t value;
   const char* text;
 };
+// In the order in which they are shown.
 extern const ThumbnailUpdateChoice kThumbnailUpdateChoices[4];
+// Of the window with the question.
 inline constexpr const char* kThumbnailUpdateTitle = "Update Thumbnails";
 inline constexpr const char* kThumbnailUpdateRequest = "Please select one of the following options.";
+// `count`: files without a thumbnail that is up to date.
 std::string ThumbnailUpdateQuestion(int32_t count);
 
 // The window of a browser, as far as this needs it.
@@ -60,7 +64,7 @@ class ThumbnailUpdateFace {
   virtual int32_t AskForUpdate(int32_t count, int32_t selected) = 0;
   // Makes the thumbnail files of these files of the list; how many were made.
   virtual int32_t BuildThumbnails(const std::vector<std::string>& files) = 0;
-  virtual void Refresh() = 0;
+  virtual void Refresh() = 0;  // the browser draws its thumbnails anew
   // The choice that the options hold is to be kept for later offers.
   virtual void KeepChoice(const ThumbnailUpdateOptions& options) { (void)options; }
 };

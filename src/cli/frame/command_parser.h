@@ -16,7 +16,7 @@ class CommandParser : public CLI::App {
 
   // Fills the options and context.names. Throws CLI::ParseError, CLI::CallForHelp for -h among them.
   void ParseArguments(std::vector<std::string> arguments);
-  std::string HelpPage() const;
+  std::string HelpPage() const;  // what --help prints, in the user's language
 
  private:
   void Reword(const CLI::ParseError& error);

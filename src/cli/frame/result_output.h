@@ -25,6 +25,7 @@ void PutStatus(Json& object, Status status);
 // and messages on standard error. Only results that go to a file are buffered, for a tenth of a second.
 class ResultOutput {
  public:
+  // `json`: results are one JSON document instead of lines.
   ResultOutput(const CommandContext& context, bool json);
   ResultOutput(const ResultOutput&) = delete;
   ResultOutput& operator=(const ResultOutput&) = delete;
@@ -52,7 +53,7 @@ class ResultOutput {
 
   // Progress on a terminal: either set each time, or counted by CountFile up to `files`.
   void ShowProgress(uint64_t done, uint64_t total);
-  void Expect(uint64_t files);
+  void Expect(uint64_t files);  // so many are going to be counted by CountFile
   // Redraws the progress if it is time.
   void Tick() { progress_.Tick(); }
   // Flushes everything and clears the progress line, before a question.
@@ -60,7 +61,7 @@ class ResultOutput {
 
   // False once standard output fails or the user has interrupted the program: loops over files end then.
   bool GoesOn() const;
-  bool Failed() const { return failures_ > 0; }
+  bool Failed() const { return failures_ > 0; }  // a file failed, so the exit status is not 0
   // Ends the array, prints the closing lines ("There were errors", "3 files were processed.") and returns the exit
   // status.
   int Finish();

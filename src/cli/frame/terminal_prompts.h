@@ -13,6 +13,7 @@ namespace fotomill::cli {
 // Answers apply to that file or that run and are never stored as settings.
 class TerminalPrompts : public Prompts {
  public:
+  // Questions go to the terminal; context and output must outlive it.
   TerminalPrompts(const CommandContext& context, ResultOutput& output) : context_(context), output_(output) {}
 
   std::optional<std::string> AskDestinationName(const NameQuestion& question) override;

@@ -11,7 +11,7 @@ namespace fotomill {
 // keeps no core of the pool busy. Asking where it lies may hang as well, and keeps none busy either.
 class FolderScope {
  public:
-  explicit FolderScope(const std::string& path);
+  explicit FolderScope(const std::string& path);  // where `path` lies decides
 
  private:
   std::optional<CoreRelease> release_;

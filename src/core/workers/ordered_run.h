@@ -26,6 +26,7 @@ class OrderedRun {
     size_t ahead = 1024;           // an item is not begun while so many before it wait to be delivered
   };
 
+  // The pool must outlive the run.
   explicit OrderedRun(Steps steps, WorkerPool& pool = WorkerPool::Shared()) : steps_(std::move(steps)), pool_(pool) {}
   OrderedRun(const OrderedRun&) = delete;
   OrderedRun& operator=(const OrderedRun&) = delete;

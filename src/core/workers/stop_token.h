@@ -28,7 +28,7 @@ class StopSource {
   // Asks for the end; whoever works notices it at its next look at the token. Any thread may call
   // both.
   void Stop() const { stopped_->store(true, std::memory_order_relaxed); }
-  StopToken Token() const { return StopToken(stopped_); }
+  StopToken Token() const { return StopToken(stopped_); }  // lives on when the source has gone
 
  private:
   std::shared_ptr<std::atomic<bool>> stopped_ = std::make_shared<std::atomic<bool>>(false);

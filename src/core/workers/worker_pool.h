@@ -108,7 +108,7 @@ class Helpers {
 // core, before any task that has not begun; one of Lane::Urgent does not wait.
 class CoreRelease {
  public:
-  CoreRelease();
+  CoreRelease();  // hands the thread's core to others while it waits
   ~CoreRelease();
   CoreRelease(const CoreRelease&) = delete;
   CoreRelease& operator=(const CoreRelease&) = delete;

@@ -10,6 +10,7 @@ namespace fotomill {
 // Words for runs of 0 to 63 pixels, then 64, 128, ... 1728 pixels. A longer run is made of these.
 inline constexpr int32_t kTerminatingCodes = 64, kMakeUpCodes = 27;
 
+// Words of white runs, as bits: first by terminating length, then by make-up length.
 inline constexpr const char* kWhiteRunWords[kTerminatingCodes + kMakeUpCodes] = {
     "00110101",  "000111",    "0111",      "1000",      "1011",      "1100",      "1110",      "1111",
     "10011",     "10100",     "00111",     "01000",     "001000",    "000011",    "110100",    "110101",
@@ -24,6 +25,7 @@ inline constexpr const char* kWhiteRunWords[kTerminatingCodes + kMakeUpCodes] = 
     "011010110", "011010111", "011011000", "011011001", "011011010", "011011011", "010011000", "010011001",
     "010011010", "011000",    "010011011"};
 
+// Words of black runs in the same order.
 inline constexpr const char* kBlackRunWords[kTerminatingCodes + kMakeUpCodes] = {
     "0000110111",    "010",           "11",            "10",            "011",           "0011",
     "0010",          "00011",         "000101",        "000100",        "0000100",       "0000101",
@@ -44,12 +46,14 @@ inline constexpr const char* kBlackRunWords[kTerminatingCodes + kMakeUpCodes] = 
 
 // Runs of 1792, 1856, ... 2560 pixels of either color.
 inline constexpr int32_t kFirstLongRun = 1792, kLongestRun = 2560;
+// Make-up words that both colors share, from 1792 on.
 inline constexpr const char* kLongRunWords[] = {
     "00000001000",  "00000001100",  "00000001101",  "000000010010", "000000010011", "000000010100", "000000010101",
     "000000010110", "000000010111", "000000011100", "000000011101", "000000011110", "000000011111"};
 
 // What a mode word says of the next changing pixel a1. Vertical(d): d pixels right of b1, the change in the row above.
 enum class FaxMode : uint8_t { VerticalLeft3, VerticalLeft2, VerticalLeft1, Vertical0, VerticalRight1, VerticalRight2, VerticalRight3, Pass, Horizontal };
+// Words of the two-dimensional modes.
 inline constexpr const char* kModeWords[] = {"0000010", "000010", "010", "1", "011", "000011", "0000011", "0001", "001"};
 
 // Two of these end the picture.

@@ -37,7 +37,7 @@ class T6Decoder {
 // Codes rows and gathers the bytes.
 class T6Encoder {
  public:
-  explicit T6Encoder(int32_t width);
+  explicit T6Encoder(int32_t width);  // `width` in pixels
 
   // Codes the next row of (width + 7) / 8 bytes.
   void EncodeRow(std::span<const uint8_t> row);

@@ -15,9 +15,11 @@ namespace fotomill {
 // The blocks of a GIF file, as laid out in gif.cpp.
 namespace gif {
 inline constexpr uint8_t kPictureBlock = 0x2C, kExtensionBlock = 0x21, kEndBlock = 0x3B;
+// Labels of extensions.
 inline constexpr uint8_t kGraphicControl = 0xF9, kComment = 0xFE, kApplication = 0xFF;
-inline constexpr int32_t kNoIndex = -1;
+inline constexpr int32_t kNoIndex = -1;  // of a frame without a transparent color
 
+// What becomes of a frame when its time is over.
 enum Disposal : uint8_t { kKeep = 1, kToBackground = 2, kToPrevious = 3 };
 }  // namespace gif
 
@@ -27,12 +29,14 @@ struct GifPalette {
   int32_t bits = 0;                 // 2^bits entries; 0: there is none
 };
 
+// The logical screen, in which the frames lie.
 struct GifScreen {
   bool is89 = false;
   int32_t width = 0, height = 0;
   GifPalette palette;
 };
 
+// One frame: where it lies in the screen, and how its pixels are coded.
 struct GifFrame {
   int32_t left = 0, top = 0, width = 0, height = 0;
   bool interlaced = false;
@@ -48,6 +52,7 @@ struct GifFrame {
     if (palette.bits == 0) return std::clamp<int32_t>(pixelBits, 1, 8);
     return palette.bits == 1 && pixelBits <= 2 ? 1 : std::clamp<int32_t>(std::max<int32_t>(palette.bits, pixelBits), 1, 8);
   }
+  // No other frame shows beside it.
   bool Covers(const GifScreen& screen) const { return left == 0 && top == 0 && width >= screen.width && height >= screen.height; }
 };
 

@@ -20,8 +20,8 @@ Status DecodeGifPixels(ByteReader& bytes, std::span<uint8_t> pixels);
 // Encodes indices of `bits` per pixel (1 to 8), handed over piece by piece in any lengths.
 class GifPixelEncoder {
  public:
-  GifPixelEncoder(ByteWriter& out, int32_t bits);
-  void Add(std::span<const uint8_t> pixels);
+  GifPixelEncoder(ByteWriter& out, int32_t bits);  // `bits` a pixel, 1 to 8
+  void Add(std::span<const uint8_t> pixels);  // indices, a byte each
   // Writes what is pending, the end code and the empty block.
   void Finish();
 

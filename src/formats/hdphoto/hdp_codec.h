@@ -41,6 +41,7 @@ Status DecodeHdp(const HdpPage& page, HdpRaster& raster, const std::function<voi
 inline constexpr char kHdpTask[] = "hdp-decode";
 bool DecodeHdpApart(const platform::ApartCall& call);
 
+// How the library is to code a picture.
 struct HdpEncoding {
   int32_t quantizer = 0;  // 0 to 255, 0 is lossless
   bool frequencyOrder = false;

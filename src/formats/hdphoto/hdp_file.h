@@ -21,6 +21,7 @@ enum class HdpColors : uint8_t {
   Rgb = 7,
   Rgbe = 8
 };
+// How one sample of a channel is stored.
 enum class HdpDepth : uint8_t {
   WhiteIsOne = 0,
   U8 = 1,
@@ -69,9 +70,9 @@ struct HdpPage {
 
 // The orientation of EXIF, 1 to 8, that a turn means, and back.
 uint16_t OrientationOfTurn(uint32_t turn);
-uint32_t HdpTurn(uint16_t orientation);
+uint32_t HdpTurn(uint16_t orientation);  // the library's number of an EXIF orientation
 
-inline constexpr int32_t kMostHdpPages = 4096;
+inline constexpr int32_t kMostHdpPages = 4096;  // more are not read
 
 // The number of pages, 0 when the file is no HD Photo.
 int32_t CountHdpPages(std::span<const uint8_t> file);

@@ -40,6 +40,7 @@ bool Guarded(JpegErrors& errors, Action action) {
   return true;
 }
 
+// A decompressor of the library with its error handler.
 struct JpegReader {
   JpegReader();
   ~JpegReader() { jpeg_destroy_decompress(&info); }

@@ -15,6 +15,7 @@ class PcxLineDecoder {
   // Bytes behind a line that Decode may overwrite, so that it can copy in larger pieces.
   static constexpr size_t kSlack = 64;
 
+  // Does not own the data.
   explicit PcxLineDecoder(std::span<const uint8_t> data) : next_(data.data()), end_(data.data() + data.size()) {}
 
   // Decodes the next `size` bytes into `line`, which has room for kSlack more. False when the data end before.

@@ -19,6 +19,7 @@ Status PngDetails(PictureRecord& picture);
 
 // The same for a file that lies in memory, as containers hold them. Statuses as above.
 Status DescribePng(std::span<const uint8_t> file, const ReadOptions& options, PictureRecord& picture);
+// A PNG file in memory: facts and pixels at once.
 Status DecodePng(std::span<const uint8_t> file, const ReadOptions& options, PictureRecord& picture);
 // Appends a PNG file of the picture's pixels, without metadata, to `out`.
 Status EncodePng(const PictureRecord& picture, const EncodeOptions& options, ByteWriter& out);

@@ -21,6 +21,7 @@ inline constexpr size_t kPngSlack = 8;
 // Chooses filters for the rows of a picture: the one with the smallest differences in sum.
 class PngFilterChooser {
  public:
+  // Rows of `size` bytes, pixels of `pixelBytes`.
   PngFilterChooser(size_t size, size_t pixelBytes) : size_(size), pixelBytes_(pixelBytes), tried_(size), best_(size) {}
   // Writes the filter's number and the filtered row to `target`, 1 + size bytes.
   void FilterRow(const uint8_t* row, const uint8_t* above, uint8_t* target);

@@ -20,7 +20,7 @@ struct TiffMessages {
 // A TIFF file in memory, opened for reading at its first directory. `bytes` must outlive it.
 class TiffInput {
  public:
-  explicit TiffInput(std::span<const uint8_t> bytes) : bytes_(bytes) {}
+  explicit TiffInput(std::span<const uint8_t> bytes) : bytes_(bytes) {}  // does not own the bytes
   ~TiffInput();
   TiffInput(const TiffInput&) = delete;
   TiffInput& operator=(const TiffInput&) = delete;
@@ -29,8 +29,8 @@ class TiffInput {
   Status Open();
   // What a failed call of the library means, by its message.
   Status Failure() const;
-  TIFF* Handle() const { return tiff_; }
-  TiffMessages& Messages() { return messages_; }
+  TIFF* Handle() const { return tiff_; }  // of the library; null until Open
+  TiffMessages& Messages() { return messages_; }  // what the library has said so far
   std::span<const uint8_t> Bytes() const { return bytes_; }
 
   // The library's doors to the bytes.
@@ -47,12 +47,12 @@ class TiffInput {
 // A TIFF file being written into `out`, which must outlive it.
 class TiffOutput {
  public:
-  explicit TiffOutput(ByteWriter& out) : out_(out) {}
+  explicit TiffOutput(ByteWriter& out) : out_(out) {}  // opens nothing yet
   ~TiffOutput();
   TiffOutput(const TiffOutput&) = delete;
   TiffOutput& operator=(const TiffOutput&) = delete;
 
-  [[nodiscard]] bool Open();
+  [[nodiscard]] bool Open();  // false if there is no memory
   TIFF* Handle() const { return tiff_; }
   // Bytes that the file has; and more of them, which the library knows nothing of.
   uint64_t End() const { return out_.Position(); }

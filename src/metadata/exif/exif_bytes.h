@@ -18,7 +18,7 @@ class ExifBytes {
 
   // The block, and numbers at offsets from its start in its own byte order.
   uint64_t Size() const { return bytes_.size(); }
-  bool BigEndian() const { return bigEndian_; }
+  bool BigEndian() const { return bigEndian_; }  // "MM"
   uint8_t U8(uint64_t offset) const { return offset < bytes_.size() ? bytes_[offset] : uint8_t{0}; }
   uint16_t U16(uint64_t offset) const { return Number<uint16_t>(offset); }
   uint32_t U32(uint64_t offset) const { return Number<uint32_t>(offset); }
@@ -49,8 +49,8 @@ class ExifBytes {
 
 // Types that TIFF knows and EXIF does not. Sources: TIFF 6.0, section 2; Adobe PageMaker 6.0 TIFF Technical Notes (1995).
 inline constexpr uint16_t kTiffFloat = 11;
-inline constexpr uint16_t kTiffDouble = 12;
-inline constexpr uint16_t kTiffIfd = 13;
+inline constexpr uint16_t kTiffDouble = 12;  // 8 bytes
+inline constexpr uint16_t kTiffIfd = 13;  // 4 bytes: the offset of a directory
 
 // Sizes of a directory: a 2-byte count, the entries, a 4-byte offset of the next directory.
 //
@@ -87,6 +87,7 @@ struct ExifField {
   uint32_t count = 0;
   uint64_t entryOffset = 0;  // of the entry itself
   uint64_t valueOffset = 0;  // of its first value, which may be beyond the block
+  // Bytes, also of a count that no file can hold.
   uint64_t ValueSize() const { return uint64_t{count} * ExifStoredSize(type); }
 };
 
@@ -106,9 +107,9 @@ inline constexpr uint16_t kExifMagic = 42;
 inline constexpr uint64_t kExifHeaderSize = 8;
 // Tags whose values are offsets and sizes in the block. Source: CIPA DC-008-2012, section 4.6.
 inline constexpr uint16_t kExifPointerTag = 0x8769;
-inline constexpr uint16_t kGpsPointerTag = 0x8825;
-inline constexpr uint16_t kThumbnailOffsetTag = 0x0201;
-inline constexpr uint16_t kThumbnailSizeTag = 0x0202;
+inline constexpr uint16_t kGpsPointerTag = 0x8825;  // offset of the GPS directory
+inline constexpr uint16_t kThumbnailOffsetTag = 0x0201;  // JPEGInterchangeFormat
+inline constexpr uint16_t kThumbnailSizeTag = 0x0202;  // JPEGInterchangeFormatLength
 
 // The block's numbers, "II" read as little-endian, any other mark as big-endian.
 inline ExifBytes OpenExifBytes(std::span<const uint8_t> block) {

@@ -8,15 +8,15 @@ namespace fotomill {
 
 // Field types of a TIFF directory entry. Source: TIFF 6.0, section 2.
 inline constexpr uint16_t kExifByte = 1;
-inline constexpr uint16_t kExifAscii = 2;
-inline constexpr uint16_t kExifShort = 3;
-inline constexpr uint16_t kExifLong = 4;
-inline constexpr uint16_t kExifRational = 5;
-inline constexpr uint16_t kExifSByte = 6;
-inline constexpr uint16_t kExifUndefined = 7;
-inline constexpr uint16_t kExifSShort = 8;
-inline constexpr uint16_t kExifSLong = 9;
-inline constexpr uint16_t kExifSRational = 10;
+inline constexpr uint16_t kExifAscii = 2;  // 1 byte, with a closing zero
+inline constexpr uint16_t kExifShort = 3;  // 2 bytes
+inline constexpr uint16_t kExifLong = 4;  // 4 bytes
+inline constexpr uint16_t kExifRational = 5;  // two LONGs: numerator, denominator
+inline constexpr uint16_t kExifSByte = 6;  // 1 byte, signed
+inline constexpr uint16_t kExifUndefined = 7;  // 1 byte, meant as the tag says
+inline constexpr uint16_t kExifSShort = 8;  // 2 bytes, signed
+inline constexpr uint16_t kExifSLong = 9;  // 4 bytes, signed
+inline constexpr uint16_t kExifSRational = 10;  // two SLONGs
 
 // Bytes of one value of a type in the editor's sense: 2 for SHORT, 4 and 8 for the long types and the rationals, 1 for
 // every other number, whatever TIFF says of it.

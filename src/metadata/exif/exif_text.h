@@ -8,6 +8,7 @@
 
 namespace fotomill {
 
+// How values are written out as text.
 struct ExifTextOptions {
   bool showTypes = false;  // the type of each value behind its name
 };

@@ -21,6 +21,7 @@ class ExifSink {
   virtual ~ExifSink() = default;
   // A directory begins: its number from 0 and its label, "IFD 0", "EXIF" or "GPS".
   virtual void Directory(int32_t number, std::string_view label) = 0;
+  // Called in the order of the block; the line's views hold until it returns.
   virtual void Line(const ExifLine& line) = 0;
 };
 

@@ -13,7 +13,7 @@ namespace fotomill::platform {
 // An open file descriptor that closes itself.
 class Handle {
  public:
-  explicit Handle(int number = -1) : number_(number) {}
+  explicit Handle(int number = -1) : number_(number) {}  // owns the number
   Handle(Handle&& other) noexcept : number_(other.Release()) {}
   Handle& operator=(Handle&& other) noexcept {
     if (this != &other) Reset(other.Release());
@@ -26,6 +26,7 @@ class Handle {
   // The system's number, -1 for none. Release hands the file over to the caller, who closes it.
   int Number() const { return number_; }
   bool IsOpen() const { return number_ >= 0; }
+  // Hands the number out; it is the caller's to close.
   int Release() {
     const int number = number_;
     number_ = -1;
@@ -53,7 +54,7 @@ bool WriteFully(int handle, const uint8_t* data, uint64_t size, int64_t offset =
 // Whether outputs are made without a name and get it when they are whole (O_TMPFILE). Tests walk the ways of systems that
 // cannot make such files, or that make them and then refuse the name.
 enum class UnnamedFiles { Work, DoNotWork, GetNoName };
-extern std::atomic<UnnamedFiles> unnamedFiles;
+extern std::atomic<UnnamedFiles> unnamedFiles;  // which of them is taken; tests change it
 
 // fsync(2), repeated when a signal interrupts it.
 bool SyncHandle(int handle);
@@ -68,6 +69,6 @@ void SyncFolderOf(const std::string& path);
 CommitResult RenameRefusing(const std::string& from, const std::string& to);
 // The first of these ways that is tried; tests begin further down than the system would need to.
 enum class RefusingRename { Directly, ByLink, ByPlaceholder };
-extern std::atomic<RefusingRename> refusingRename;
+extern std::atomic<RefusingRename> refusingRename;  // where it begins; tests change it
 
 }  // namespace fotomill::platform

@@ -37,8 +37,8 @@ class ColorCounts {
   static constexpr uint32_t kMostColors = 65536;
 
   Status Open();  // MemoryAllocationError
-  void AddRow(const uint8_t* bgr, int32_t width);
-  std::vector<ColorBin> Bins();
+  void AddRow(const uint8_t* bgr, int32_t width);  // `width` pixels
+  std::vector<ColorBin> Bins();  // those that were met
 
  private:
   struct Slot {

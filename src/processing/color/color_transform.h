@@ -20,7 +20,7 @@ class ColorTransform {
   ColorTransform(const ColorTransform&) = delete;
   ColorTransform& operator=(const ColorTransform&) = delete;
 
-  bool ChangesColors() const { return transform_ != nullptr; }
+  bool ChangesColors() const { return transform_ != nullptr; }  // false: Apply does nothing
   // Changes the pixels of an image of 24 bits, or the color table of a smaller one; large images on all cores. A picture in
   // colors with the profile of a gray one stays as it is. Any number of threads may call this at once.
   void Apply(PackedImage& image) const;

@@ -20,7 +20,7 @@ struct ColorPoints {
 
 // Points from the first `count` colors of a palette, and back, rounded.
 ColorPoints PointsOf(const Palette& palette, int32_t count);
-Palette PaletteOf(const ColorPoints& points);
+Palette PaletteOf(const ColorPoints& points);  // levels are rounded
 
 // How much a squared difference of blue, green and red counts: about as the eye notices it, yet even enough that plain
 // errors stay small as well.

@@ -20,7 +20,7 @@ struct PointEffect {
   std::array<ChannelTable, 3> tables{};                         // blue, green, red
   std::function<void(uint8_t* bgr, size_t pixels)> colors = {};  // used in place of the tables when set
 
-  bool IsTable() const { return !colors; }
+  bool IsTable() const { return !colors; }  // each channel by itself, through a table
 };
 
 // The effect with one table for all channels: value v becomes `value(v)`, rounded to nearest (ties up) and clamped.

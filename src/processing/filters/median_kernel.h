@@ -22,6 +22,6 @@ using MedianRow = void (*)(const ColumnCounts& columns, int32_t window, int32_t 
 
 // For this processor, and for any. Both give the same.
 MedianRow MedianRowHere();
-MedianRow BaselineMedianRow();
+MedianRow BaselineMedianRow();  // the one that every processor can run
 
 }  // namespace fotomill

@@ -40,6 +40,6 @@ struct ResampleKernels {
 
 // The loops for this processor, and those that every processor of the build can run. Their results are the same.
 const ResampleKernels& ResampleKernelsHere();
-const ResampleKernels& BaselineResampleKernels();
+const ResampleKernels& BaselineResampleKernels();  // those that every processor can run
 
 }  // namespace fotomill

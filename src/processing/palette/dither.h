@@ -44,7 +44,7 @@ class ErrorDiffuser {
   // sixteenths of its error. MemoryAllocationError.
   Status Open(int32_t width, bool serpentine, int32_t handedOn);
   void Row(const uint8_t* bgr, NearestColor& nearest, uint8_t* indices);
-  void GrayRow(const uint8_t* gray, uint8_t* indices);
+  void GrayRow(const uint8_t* gray, uint8_t* indices);  // one byte a pixel
 
  private:
   template <int step>

@@ -32,15 +32,19 @@ class BatchWindows {
   virtual void BatchOpened() = 0;
   // `outcome` is that of the file that the line is about, empty for lines about the batch.
   virtual void BatchLine(const ProgressLine& line, const FileOutcome& outcome) = 0;
+  // The line that tells which file is in work.
   virtual void BatchStatus(const std::string& status) = 0;
-  virtual void BatchProgress(uint32_t done, uint32_t count) = 0;
+  virtual void BatchProgress(uint32_t done, uint32_t count) = 0;  // files
   // The end: the box stays open to be read, or goes.
   virtual void BatchStaysOpen(const ProgressModel& model) = 0;
   virtual void BatchCloses() = 0;
+  // The name of an output is taken. The batch waits for the answer.
   virtual OverwriteAnswer AskOverwrite(const OverwriteQuestion& question, const OverwritePreview& preview) = 0;
+  // `nullopt`: the file is skipped.
   virtual std::optional<std::string> AskDestinationName(const NameQuestion& question) = 0;
-  virtual std::optional<std::string> AskPassword(const std::string& path) = 0;
+  virtual std::optional<std::string> AskPassword(const std::string& path) = 0;  // nullopt: Cancel
   virtual bool ConfirmFormat(const std::string& question) = 0;
+  // `yes`: the text of the button that agrees.
   virtual bool Confirm(const std::string& question, const std::string& yes) = 0;
   // After everything else. MemoryAllocationError where the batch itself ran out of memory.
   virtual void BatchEnded(Status status, const BatchJob& job) = 0;
@@ -52,6 +56,7 @@ class BatchThread {
  public:
   using Post = std::function<void(std::function<void()>)>;
 
+  // The windows must outlive it.
   BatchThread(BatchWindows& windows, Post post) : windows_(windows), post_(std::move(post)) {}
   // Asks a running batch to stop, answers its questions with no, and waits for it. `post` must not be waiting for this.
   ~BatchThread();
@@ -66,7 +71,7 @@ class BatchThread {
   void StartWork(BatchJob job, Work work);
   // Asks the batch to stop; it finishes what is in work.
   void Abort() { job_.stop.Stop(); }
-  bool Running() const { return running_; }
+  bool Running() const { return running_; }  // until BatchEnded
 
  private:
   class Box;

@@ -21,8 +21,8 @@ class BrowserModel {
  public:
   // The folder, and how it is shown.
   const std::string& Folder() const { return folder_; }
-  const BrowserModes& Modes() const { return view_.modes; }
-  bool Descending() const { return view_.descending; }
+  const BrowserModes& Modes() const { return view_.modes; }  // view mode, thumbnails, sort mode
+  bool Descending() const { return view_.descending; }  // of the sort mode
   const FolderView& View() const { return view_; }
   void SetView(const FolderView& view);  // sorts anew where the order changes
   void SetSort(int32_t sortMode, bool descending);  // choice::SortMode
@@ -34,11 +34,11 @@ class BrowserModel {
   void SetItems(std::vector<FolderItem> items);
   // Facts that were found later; sorts anew only by UpdateOrder.
   void SetFacts(size_t item, const FolderItem& facts) { items_[item] = facts; }
-  void UpdateOrder();
+  void UpdateOrder();  // sorts by the facts as they are now; the selection stays with its items
 
   // Only lines whose name matches are shown; selection of others comes back with them.
   void SetFilter(const std::string& filter);
-  const std::string& Filter() const { return filter_; }
+  const std::string& Filter() const { return filter_; }  // empty: everything is shown
 
   // Items are what the folder holds, lines what the filter lets pass, both from 0. The model keeps
   // what is returned until the next change.
@@ -47,7 +47,7 @@ class BrowserModel {
   size_t LineCount() const { return lines_.size(); }
   size_t ItemOfLine(size_t line) const { return lines_[line]; }
   const FolderItem& Line(size_t line) const { return items_[lines_[line]]; }
-  std::string PathOfLine(size_t line) const;
+  std::string PathOfLine(size_t line) const;  // folder and name
   // The line of that name, kNoLine when it is not shown.
   size_t FindLine(std::string_view name) const;
   // The next line whose name begins with `typed`, from the focus on: `typed` of one letter typed again continues to the next.
@@ -60,12 +60,14 @@ class BrowserModel {
   std::vector<std::string> FilesForFunction() const;
   // The same with folders.
   std::vector<std::string> PathsForFunction() const;
+  // PathsForFunction would not be empty.
   bool HasPathForFunction() const { return selection_.SelectedCount() > 0 || selection_.Focus() != kNoLine; }
-  bool HasFileForFunction() const;
+  bool HasFileForFunction() const;  // FilesForFunction would not be empty
   // All files that are shown, in list order.
   std::vector<std::string> ShownFiles() const;
+  // Among the lines that are shown; an empty pattern matches none.
   void SelectMatching(std::string_view pattern, MatchMode mode);
-  void SelectSameType();
+  void SelectSameType();  // the lines of the focused one's format, and nothing else
 
   // "312 files, 4 selected, 18.2 MB"
   std::string CountText() const;

@@ -12,6 +12,7 @@ namespace fotomill::desktop {
 struct Rect {
   int32_t x = 0, y = 0, width = 0, height = 0;
 
+  // A point on the right or bottom edge is outside.
   bool Contains(int32_t px, int32_t py) const { return px >= x && py >= y && px < x + width && py < y + height; }
   bool operator==(const Rect&) const = default;
 };
@@ -25,13 +26,15 @@ class CellLayout {
  public:
   // Cells of that size, `spread` apart at least; a row's spare width is shared out between them.
   void SetCells(int32_t width, int32_t height, int32_t gap);
-  void SetWindow(int32_t width, int32_t height);
-  void SetCount(size_t count) { count_ = count; }
+  void SetWindow(int32_t width, int32_t height);  // the part of the list that is seen
+  void SetCount(size_t count) { count_ = count; }  // lines
 
   // The grid, and how far down a window can scroll so that no room is left below the last row.
   int32_t Columns() const { return columns_; }
+  // The last one may be short.
   int64_t Rows() const { return (static_cast<int64_t>(count_) + columns_ - 1) / columns_; }
-  int32_t RowHeight() const { return cellHeight_ + gap_; }
+  int32_t RowHeight() const { return cellHeight_ + gap_; }  // with the gap to the next
+  // With the gap above the first row.
   int64_t TotalHeight() const { return Rows() * RowHeight() + gap_; }
   int64_t LargestScroll() const;
 

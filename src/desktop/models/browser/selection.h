@@ -23,9 +23,10 @@ class Selection {
   // nowhere.
   size_t Count() const { return selected_.size(); }
   size_t SelectedCount() const { return selectedCount_; }
+  // False beyond the last line.
   bool IsSelected(size_t line) const { return line < selected_.size() && selected_[line]; }
   size_t Focus() const { return focus_; }
-  size_t Anchor() const { return anchor_; }
+  size_t Anchor() const { return anchor_; }  // where a range begins that Shift extends
   // Selected lines in list order.
   std::vector<size_t> SelectedLines() const;
 
@@ -40,12 +41,12 @@ class Selection {
   // The focus goes to a line by keyboard: alone it selects the line, with Shift the range from the anchor, with Ctrl
   // it moves without selecting.
   void MoveFocus(size_t line, bool shift, bool control);
-  void ToggleFocus();
-  void SelectOnly(size_t line);
+  void ToggleFocus();  // selects the focused line, or not any more; others stay
+  void SelectOnly(size_t line);  // focus and anchor go there
   void SelectAll();
-  void SelectNone();
-  void Invert();
-  void Set(size_t line, bool selected);
+  void SelectNone();  // the focus stays
+  void Invert();  // selects what was not, and nothing else
+  void Set(size_t line, bool selected);  // focus and anchor stay
 
   // The rubber band: `inside` are the lines that it touches now; with `keep` they add to what was selected when it began.
   void BeginBand(bool keep);

@@ -11,7 +11,7 @@ class ClosedTabs {
  public:
   // Takes up the list of earlier runs. Add puts a folder on top and writes the list.
   void Load();
-  bool Empty() const { return folders_.empty(); }
+  bool Empty() const { return folders_.empty(); }  // there is no tab to reopen
   void Add(const std::string& folder);
   // The folder of the tab closed last, which is forgotten; none if there is none.
   std::optional<std::string> Pop();

@@ -11,6 +11,7 @@ class Favourites {
  public:
   // Takes up the folders that the file holds now.
   void Load();
+  // Absolute paths in the user's order.
   const std::vector<std::string>& Folders() const { return folders_; }
   bool Has(const std::string& folder) const;
   // False when the folder cannot be on a line, there are too many, or the file cannot be written.

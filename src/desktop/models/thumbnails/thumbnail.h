@@ -32,8 +32,9 @@ struct Thumbnail {
   bool animated = false;  // the pages are frames that follow each other
   bool standIn = false;   // the thumbnail that the file itself holds, which nobody has compared with the picture
 
-  uint64_t Bytes() const { return sizeof *this + pixels.bytes.size(); }
+  uint64_t Bytes() const { return sizeof *this + pixels.bytes.size(); }  // what it takes in a cache
 };
+// Shared by cache and windows; never changes.
 using ThumbnailPointer = std::shared_ptr<const Thumbnail>;
 
 // Gets a picture's thumbnail: a record from its thumbnail file or the database of the browser's mode when that is as new as the

@@ -35,7 +35,7 @@ class ThumbnailLoader {
 
   // Sets the wanted thumbnails, most urgent first. Pending requests are replaced; running ones finish.
   void Want(std::vector<ThumbnailRequest> requests);
-  std::vector<Result> FetchResults();
+  std::vector<Result> FetchResults();  // those that came since the last call
   // Thumbnails that wait or are in progress.
   size_t Pending() const;
 
@@ -59,14 +59,14 @@ unsigned ThumbnailsAtOnce();
 // Loaded thumbnails: an LRU cache, bounded in bytes.
 class ThumbnailCache {
  public:
-  explicit ThumbnailCache(uint64_t capacity) : capacity_(capacity) {}
+  explicit ThumbnailCache(uint64_t capacity) : capacity_(capacity) {}  // bytes
   // Null when it is not there, or is there for another state of the file, or another side.
   ThumbnailPointer Find(const ThumbnailRequest& request);
   // The thumbnail of a path in whatever state and size there is: something to show until the right one comes.
   ThumbnailPointer FindAny(const std::string& path) const;
   void Put(const ThumbnailRequest& request, ThumbnailPointer thumbnail);
   void Clear();
-  uint64_t Bytes() const { return bytes_; }
+  uint64_t Bytes() const { return bytes_; }  // of all thumbnails in it
   size_t Count() const { return entries_.size(); }
 
  private:

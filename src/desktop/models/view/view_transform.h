@@ -24,16 +24,17 @@ class ViewTransform {
 
   // Another picture at the same zoom, and at the same place in parts of it.
   void SetPicture(int32_t width, int32_t height);
-  void SetWindow(int32_t width, int32_t height);
+  void SetWindow(int32_t width, int32_t height);  // device pixels
   void SetMode(ZoomMode mode);
   // What the key DefaultViewZoom stands for (choice::ViewZoom).
   void SetModeFromKey(int32_t zoom);
   // A scale of its own; the picture's point at x, y of the window stays there.
   void ZoomTo(double scale, double x, double y);
+  // As ZoomTo, in relation to the scale now.
   void ZoomBy(double factor, double x, double y) { ZoomTo(scale_ * factor, x, y); }
   // To the scale in the middle of the window.
   void ZoomToMiddle(double scale) { ZoomTo(scale, windowWidth_ / 2.0, windowHeight_ / 2.0); }
-  void Pan(double dx, double dy);
+  void Pan(double dx, double dy);  // device pixels; stops at the picture's edges
   ViewPlace Place() const;
   void SetPlace(const ViewPlace& place);
   // To the middle; a zoom of its own gives way to what the key stands for, fitting stays.
@@ -48,6 +49,7 @@ class ViewTransform {
   // Of the picture's top left corner; negative when it is outside.
   int32_t X() const;
   int32_t Y() const;
+  // More of the picture is outside the window.
   bool CanPan() const { return ShownWidth() > windowWidth_ || ShownHeight() > windowHeight_; }
 
  private:

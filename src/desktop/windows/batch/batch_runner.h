@@ -27,7 +27,7 @@ class BatchRunner : public wxEvtHandler, public BatchWindows {
   void Run(std::vector<BatchFile> files, BatchFunction function, BatchJob job);
   // With the files that the batch will replace, where it keeps them.
   void Run(BatchJob job, BatchThread::Work work, std::shared_ptr<PreviousFiles> previous = nullptr);
-  bool Running() const { return thread_->Running(); }
+  bool Running() const { return thread_->Running(); }  // one batch at a time
 
  private:
   struct Waiting {

@@ -33,24 +33,28 @@ class BrowserHost {
   virtual const FolderViews& Views() = 0;  // how folders are to be shown
   // What the user did to files of the browser: the frame does it.
   virtual void ViewFile(const std::string& path) = 0;
+  // `onFile`: of the selection, else of the folder.
   virtual void ShowContextMenu(wxWindow& window, const wxPoint& place, bool onFile) = 0;
+  // `name` without a folder.
   virtual void RenameFile(const std::string& path, const std::string& name) = 0;
+  // `move`: else they are copied.
   virtual void DropFiles(const std::vector<std::string>& files, const std::string& folder, bool move) = 0;
 };
 
 // One browser: the contents of a tab. Shows a folder as thumbnails, names or details.
 class BrowserPage : public wxPanel {
  public:
+  // Host and thumbnails must outlive it.
   BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& thumbnails, const FolderView& view);
 
   // Goes to a folder; `focus` is the name that gets the focus once it is listed.
   void Open(const std::string& folder, const std::string& focus = {});
-  void Reload();
+  void Reload();  // reads the folder again; the selection stays with its names
   // Goes back, or ahead, to folders that this browser showed.
   void StepAlongTrail(int steps);
   void GoBack() { StepAlongTrail(-1); }
   void GoForward() { StepAlongTrail(1); }
-  void GoUp();
+  void GoUp();  // to the parent folder
 
   // What the browser shows. After a change of its selection, SelectionChanged is to be called.
   const BrowserModel& Model() const { return model_; }
@@ -66,9 +70,9 @@ class BrowserPage : public wxPanel {
   void SelectionChanged();
   // Focus on the line of a name, scrolled into view.
   void FocusName(const std::string& name);
-  void EditFocusedName();
+  void EditFocusedName();  // in place, in the list
   void EditPath();
-  void OfferTrail();
+  void OfferTrail();  // the folders to go back to, as a menu
   void EditFilter();
   // Lets the user choose the columns of the details, which are then shown.
   void ChooseColumns();
@@ -76,10 +80,10 @@ class BrowserPage : public wxPanel {
   void KeepColumns();
   // This browser comes to the front.
   void Activated();
-  void FocusList();
-  bool Listing() const { return reader_.Listing(); }
+  void FocusList();  // the keyboard goes to the list
+  bool Listing() const { return reader_.Listing(); }  // the folder is still being read
   size_t MissingThumbnails() const;
-  int64_t Scroll() const;
+  int64_t Scroll() const;  // pixels
   // Scrolled so far once the folder is listed.
   void RestoreScroll(int64_t scroll) { wantedScroll_ = scroll; }
 

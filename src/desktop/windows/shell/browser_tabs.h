@@ -35,22 +35,23 @@ class BrowserTabs : private BrowserHost {
   std::vector<std::string> SelectedFiles() const;
   // The same with folders.
   std::vector<std::string> SelectedPaths() const;
-  std::string CurrentFolder() const;
+  std::string CurrentFolder() const;  // of the browser in front
   // Selects those of the files that the browser in front shows.
   void SelectFiles(const std::vector<std::string>& files);
 
-  BrowserPage* Open(const std::string& folder);
+  BrowserPage* Open(const std::string& folder);  // in a new tab, which comes to the front
   // The tab that shows the folder, or a new one.
   BrowserPage* Show(const std::string& folder);
   // The tab in front, unless it is the last one.
   void Close();
-  bool HasClosed() const { return !closed_.Empty(); }
+  bool HasClosed() const { return !closed_.Empty(); }  // there is a tab to reopen
   void Reopen();
   // Goes `step` tabs on, or back, round about.
   void Step(int step);
 
   // Every browser reads its folder again.
   void Reload();
+  // Browsers of the folder, or of one below, go with it.
   void FollowRename(const std::string& from, const std::string& to);
 
   // Opens the tabs of a session behind those that are open, or in their place.

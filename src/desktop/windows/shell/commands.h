@@ -42,7 +42,7 @@ const Command* CommandOfSymbol(std::string_view symbol);
 // The id of a row's menu item and button.
 inline constexpr int kFirstCommandId = wxID_HIGHEST + 100;
 inline int CommandId(const Command& command) { return kFirstCommandId + static_cast<int>(&command - Commands().data()); }
-bool IsCommandId(int id);
+bool IsCommandId(int id);  // false for identifiers of the toolkit
 // The command of such an id.
 const Command& CommandOfId(int id);
 

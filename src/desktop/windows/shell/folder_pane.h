@@ -29,7 +29,8 @@ class FolderPane {
   void Follow(const std::string& folder);
   // Favourites, volumes or folders may have come or gone.
   void UpdatePlaces();
-  void Reread();
+  void Reread();  // folders may have come or gone below those that are open
+  // Favorites go with their folder.
   void FollowRename(const std::string& from, const std::string& to);
 
   bool IsFavourite(const std::string& folder) const { return favourites_.Has(folder); }

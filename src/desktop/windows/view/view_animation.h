@@ -33,12 +33,12 @@ class ViewAnimation {
   void Begin(const ViewPicturePointer& picture);
   // Another picture is awaited.
   void End();
-  bool Active() const { return player_ != nullptr; }
+  bool Active() const { return player_ != nullptr; }  // there is an animation on the canvas
   bool Playing() const;
   // In full screen there is the picture alone.
   void HideBar(bool hide);
-  void Toggle();
-  void Step(int frames);
+  void Toggle();  // plays or pauses
+  void Step(int frames);  // pauses, and shows the frame so many on or back
   void Resized();
   // Frames are to be shown in another way.
   void ShowAgain();

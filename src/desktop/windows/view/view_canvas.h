@@ -45,7 +45,7 @@ class ViewCanvas : public wxWindow {
   // Zoom by a step, to one pixel a pixel, or by a mode, about the middle of the window.
   void ZoomIn() { ZoomBy(ViewTransform::kStep); }
   void ZoomOut() { ZoomBy(1 / ViewTransform::kStep); }
-  void ZoomActual();
+  void ZoomActual();  // one pixel of the screen a pixel
   void SetZoom(ZoomMode mode);
   // Pixels of the screen a pixel of the picture, and whether more of it is outside the window.
   double Zoom() const { return transform_.Scale(); }

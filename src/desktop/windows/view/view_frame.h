@@ -20,14 +20,15 @@ class Shell;
 // A view window: one picture at a time, with its neighbours of the list that it was opened from decoded ahead.
 class ViewFrame : public wxFrame {
  public:
+  // Opens on `file`; `list` has its neighbors, and the file itself.
   ViewFrame(Shell& shell, const std::vector<std::string>& list, const std::string& file);
   ~ViewFrame() override;
 
   // Commands, by keys and menu.
   void Step(int files);
-  void GoTo(size_t place);
+  void GoTo(size_t place);  // in the list, from 0
   void StepPage(int pages);  // or frames of an animation
-  void StepFrame(int frames);
+  void StepFrame(int frames);  // pauses the animation; without one nothing happens
   void PlayOrNext();  // plays or pauses an animation; without one, the next picture
   void ToggleFullScreen();
   void ToggleSlideshow();
@@ -35,13 +36,13 @@ class ViewFrame : public wxFrame {
   void ToggleOverlay();
   void SettingSwitched();  // one that says how pictures look or stay
   void Leave();            // full screen first, then the window
-  void CopyPicture();
+  void CopyPicture();  // to the clipboard; alpha on the background of view windows
   void DeleteFile();  // to the trash; the next one is shown
   void ShowInfoWindow();
   void Turn(Orientation turn);  // the view; nothing is written
   void SaveTurned();            // the file, as it is seen
   void Undo();                  // the view's turn, else what was done to files
-  void Redo();
+  void Redo();  // of what was done to files
   // Files were written: a picture whose file is another one now is loaded again.
   void FilesChanged();
   // Calls once when the first picture is there, or the window goes without.
