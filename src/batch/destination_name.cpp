@@ -197,22 +197,6 @@ std::optional<std::string> CompletedDestination(const std::string& destination, 
   return whole;
 }
 
-VariantSearch MakeNumberedVariant(std::string& path, int64_t first, int64_t last, const TakenTest& taken,
-                                  const StopToken& stop) {
-  const std::string base(platform::SplitPath(path).base);
-  for (int64_t number = first; number <= last; ++number) {
-    if (stop.Asked()) return VariantSearch::Stopped;
-    if (number - first == kMostVariants) return VariantSearch::GivenUp;
-    std::string variant = WithBase(path, base + " [" + std::to_string(number) + "]");
-    const platform::Existence existence = taken(variant);
-    if (existence == platform::Existence::Unknown) return VariantSearch::Unknown;
-    if (existence == platform::Existence::Yes) continue;
-    path = std::move(variant);
-    return VariantSearch::Found;
-  }
-  return VariantSearch::AllTaken;
-}
-
 void SayNoName(const Destination& destination, FileOutcome& outcome) {
   outcome.destination.clear();
   outcome.status = Status::ErrorCreatingFile;

@@ -8,6 +8,7 @@
 
 #include "batch/job.h"
 #include "batch/prompts.h"
+#include "files/numbered_name.h"
 #include "platform/existence.h"
 #include "core/workers/stop_token.h"
 #include "texts/texts.h"
@@ -43,24 +44,6 @@ std::string PlannedDestination(const std::string& source, const OutputPlace& pla
 // A destination without drive and folder, put into the job's destination folder; others stay. nullopt when that gives 261
 // characters or more.
 std::optional<std::string> CompletedDestination(const std::string& destination, std::string_view folder);
-
-// Whether a path is taken, so that a new file cannot have it.
-using TakenTest = std::function<platform::Existence(const std::string& path)>;
-
-// The result of the search for a numbered variant.
-enum class VariantSearch {
-  Found,
-  AllTaken,  // every number of the range, or the range is empty
-  GivenUp,   // kMostVariants are taken
-  Unknown,   // the system cannot tell; it keeps the reason
-  Stopped,
-};
-inline constexpr int64_t kMostVariants = 100'000;
-
-// Replaces `path` by the first of "NAME [first].EXT" to "NAME [last].EXT" that is not taken. `path` is unchanged unless Found.
-// `stop` is checked before each try.
-VariantSearch MakeNumberedVariant(std::string& path, int64_t first, int64_t last, const TakenTest& taken,
-                                  const StopToken& stop = {});
 
 // The decision about an output's name.
 struct Destination {

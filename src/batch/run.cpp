@@ -28,7 +28,6 @@ namespace fotomill {
 
 namespace {
 
-constexpr int kMostLostRaces = 100;
 constexpr const char* kNoName = TrLater("The name would be empty or contain a folder.");
 constexpr const char* kTooLong = TrLater("The path would be longer than 260 characters.");
 
@@ -234,35 +233,45 @@ class Batch {
   bool Reduces(const OutputTarget& target) const { return function_.reduce || target.kept; }
 
   // Settles the name and writes, again when someone else has taken the name since it was found free.
-  std::optional<FileOutcome> WriteUnderFreeName(size_t i, Destination planned, PictureRecord& picture, const OutputTarget& target,
+  std::optional<FileOutcome> WriteUnderFreeName(size_t i, const Destination& planned, PictureRecord& picture, const OutputTarget& target,
                                                 platform::HeldFile& source) {
+    std::optional<FileOutcome> outcome;
+    const bool settled = RetryLostRaces([&] { return TryToWrite(i, planned, picture, target, source, outcome); });
+    return settled ? outcome : Failure(files_[i], Status::ErrorCreatingFile, Tr(kWriteAborted));
+  }
+
+  // One attempt at that. False when the name was lost; otherwise `outcome` is what came of the file, none if it was given up.
+  bool TryToWrite(size_t i, Destination destination, PictureRecord& picture, const OutputTarget& target,
+                  platform::HeldFile& source, std::optional<FileOutcome>& outcome) {
     const BatchFile& file = files_[i];
-    for (int attempt = 0; attempt < kMostLostRaces; ++attempt) {
-      Destination destination = planned;
-      bool cancelled = false;
-      if (Settle(i, destination, picture, cancelled) == DestinationAnswer::Skip) {
-        cancelled = cancelled || destination.search == VariantSearch::Stopped;
-        return cancelled ? std::nullopt : std::optional(Skipped(file, destination));
-      }
-      if (destination.path.size() > PathText::Capacity()) {
-        GiveBack(destination.path);
-        return Failure(file, Status::InvalidDestination, kTooLong);
-      }
-      const bool replaces = destination.replace && platform::FileExists(destination.path);
-      platform::HeldFile held;
-      if (!function_.dryRun && destination.replace && !Hold(destination, source, held)) {
-        GiveBack(destination.path);
-        return job_.stop.Token().Asked() ? std::nullopt : std::optional(NotHeld(file));
-      }
-      std::string hint;
-      const Status status = function_.dryRun ? Status::Ok : Write(picture, destination, target, hint);
-      if (status == Status::Ok) return Written(file, destination, replaces, picture);
-      GiveBack(destination.path);
-      const bool lostRace =
-          status == Status::ErrorCreatingFile && !destination.replace && platform::IsRegularFile(destination.path);
-      if (!lostRace) return Failure(file, status, hint.empty() ? WriteHint(destination, status, picture, target) : hint);
+    bool cancelled = false;
+    if (Settle(i, destination, picture, cancelled) == DestinationAnswer::Skip) {
+      cancelled = cancelled || destination.search == VariantSearch::Stopped;
+      if (!cancelled) outcome = Skipped(file, destination);
+      return true;
     }
-    return Failure(file, Status::ErrorCreatingFile, Tr(kWriteAborted));
+    if (destination.path.size() > PathText::Capacity()) {
+      GiveBack(destination.path);
+      outcome = Failure(file, Status::InvalidDestination, kTooLong);
+      return true;
+    }
+    const bool replaces = destination.replace && platform::FileExists(destination.path);
+    platform::HeldFile held;
+    if (!function_.dryRun && destination.replace && !Hold(destination, source, held)) {
+      GiveBack(destination.path);
+      if (!job_.stop.Token().Asked()) outcome = NotHeld(file);
+      return true;
+    }
+    std::string hint;
+    const Status status = function_.dryRun ? Status::Ok : Write(picture, destination, target, hint);
+    if (status == Status::Ok) {
+      outcome = Written(file, destination, replaces, picture);
+      return true;
+    }
+    GiveBack(destination.path);
+    if (!destination.replace && LostRace(status, destination.path)) return false;
+    outcome = Failure(file, status, hint.empty() ? WriteHint(destination, status, picture, target) : hint);
+    return true;
   }
 
   // Holds the file to be replaced. One that goes to the recycle bin is not lost, whoever has changed it.
@@ -273,7 +282,7 @@ class Batch {
 
   void GiveBack(const std::string& path) {
     const std::lock_guard lock(mutex_);
-    names_.TakeBack(path);
+    names_.Release(path);
   }
 
   DestinationAnswer Settle(size_t i, Destination& destination, const PictureRecord& picture, bool& cancelled) {

@@ -58,7 +58,7 @@ platform::Existence RunNames::Taken(const std::string& path, const std::string& 
 
 void RunNames::Give(const std::string& path) { given_.insert(Key(path)); }
 
-void RunNames::TakeBack(const std::string& path) {
+void RunNames::Release(const std::string& path) {
   given_.erase(Key(path));
   ForgetVariants();
 }

@@ -38,7 +38,7 @@ class RunNames {
   // Gives a path to an output.
   void Give(const std::string& path);
   // The output was not written: its name is free again.
-  void TakeBack(const std::string& path);
+  void Release(const std::string& path);
   // A variant that was found is not used.
   void ForgetVariants() { variants_.clear(); }
 

@@ -27,7 +27,6 @@ namespace fotomill {
 
 namespace {
 
-constexpr int kMostLostRaces = 100;
 constexpr int32_t kPageDigits = 5;
 // Cells that may wait for those before them: so many, and fewer when they are large.
 constexpr size_t kCellsAhead = 64;
@@ -199,6 +198,41 @@ class ContactSheet {
   std::atomic<bool> ended_{false};
 };
 
+// Writes the page under the next free number. `lostRace`: another program took that meanwhile.
+Status WriteNextPage(PictureRecord& page, const CataloguePageOptions& options, BatchJob& job, std::string& path, bool& lostRace) {
+  lostRace = false;
+  const TakenTest taken = platform::ExistenceOf;
+  const VariantMaker variant = [&](std::string& candidate) {
+    return MakeNumberedVariant(candidate, job.naming.firstVariant, job.naming.lastVariant, taken, job.stop.Token());
+  };
+  std::string name;
+  const Status named = NextPageName(job, name);
+  path = name;
+  RETURN_IF_BAD(named);
+  Destination destination;
+  destination.path = name;
+  if (path.size() > PathText::Capacity()) return Status::InvalidDestination;
+  const DestinationAnswer answer = MakeDestinationName(destination, name, TrLater("Catalogue page"), job, taken, variant, &page);
+  if (destination.search == VariantSearch::GivenUp) return Status::InvalidDestination;
+  if (destination.search == VariantSearch::Unknown) return Status::ErrorCreatingFile;
+  if (destination.search == VariantSearch::AllTaken) ++job.writeAborts;
+  if (answer == DestinationAnswer::Skip) return Status::FunctionCancelled;
+  path = destination.path;
+  const FormatEntry& row = FormatRow(job.formatIndex);
+  if (!CanWrite(row)) return Status::UnsupportedFunction;
+  const auto deepest = static_cast<int32_t>(row.maxBits);
+  if (!options.reduce && page.bitsPerPixel > deepest) return Status::TooManyColors;
+  if (!options.dryRun) RETURN_IF_BAD(ReduceColors(page, deepest, job.reduction));
+  const Status status = WritePage(page, options, destination, job);
+  lostRace = !destination.replace && LostRace(status, path);
+  if (status == Status::Ok && !options.dryRun) {
+    job.filesChanged = true;
+    job.uses.push_back(
+        {platform::AbsolutePath(path), FileFunction::Catalog, kOwnTime, static_cast<int32_t>(platform::Now()), false});
+  }
+  return status;
+}
+
 }  // namespace
 
 std::string CataloguePageName(std::string_view prefix, uint32_t number, std::string_view extension) {
@@ -208,40 +242,13 @@ std::string CataloguePageName(std::string_view prefix, uint32_t number, std::str
 }
 
 Status WriteCataloguePage(PictureRecord& page, const CataloguePageOptions& options, BatchJob& job, std::string& path) {
-  const TakenTest taken = platform::ExistenceOf;
-  const VariantMaker variant = [&](std::string& candidate) {
-    return MakeNumberedVariant(candidate, job.naming.firstVariant, job.naming.lastVariant, taken, job.stop.Token());
-  };
-  for (int attempt = 0; attempt < kMostLostRaces; ++attempt) {
-    std::string name;
-    const Status named = NextPageName(job, name);
-    path = name;
-    RETURN_IF_BAD(named);
-    Destination destination;
-    destination.path = name;
-    if (path.size() > PathText::Capacity()) return Status::InvalidDestination;
-    const DestinationAnswer answer = MakeDestinationName(destination, name, TrLater("Catalogue page"), job, taken, variant, &page);
-    if (destination.search == VariantSearch::GivenUp) return Status::InvalidDestination;
-    if (destination.search == VariantSearch::Unknown) return Status::ErrorCreatingFile;
-    if (destination.search == VariantSearch::AllTaken) ++job.writeAborts;
-    if (answer == DestinationAnswer::Skip) return Status::FunctionCancelled;
-    path = destination.path;
-    const FormatEntry& row = FormatRow(job.formatIndex);
-    if (!CanWrite(row)) return Status::UnsupportedFunction;
-    const auto deepest = static_cast<int32_t>(row.maxBits);
-    if (!options.reduce && page.bitsPerPixel > deepest) return Status::TooManyColors;
-    if (!options.dryRun) RETURN_IF_BAD(ReduceColors(page, deepest, job.reduction));
-    const Status status = WritePage(page, options, destination, job);
-    const bool lostRace = status == Status::ErrorCreatingFile && !destination.replace && platform::FileExists(path);
-    if (lostRace) continue;  // the next number, then
-    if (status == Status::Ok && !options.dryRun) {
-      job.filesChanged = true;
-      job.uses.push_back(
-          {platform::AbsolutePath(path), FileFunction::Catalog, kOwnTime, static_cast<int32_t>(platform::Now()), false});
-    }
-    return status;
-  }
-  return Status::ErrorCreatingFile;
+  Status status = Status::ErrorCreatingFile;
+  (void)RetryLostRaces([&] {
+    bool lostRace = false;
+    status = WriteNextPage(page, options, job, path, lostRace);
+    return !lostRace;
+  });
+  return status;
 }
 
 Status RunContactSheet(std::span<const BatchFile> files, const ContactSheetOptions& options, BatchJob& job) {

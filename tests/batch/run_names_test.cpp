@@ -51,7 +51,7 @@ TEST(RunNames, AreTakenUntilTheyAreGivenBack) {
   EXPECT_EQ(names.Taken("/out/a.pcx", "/x/a.bmp"), platform::Existence::No);
   names.Give("/out/a.pcx");
   EXPECT_EQ(names.Taken("/out/b/../a.pcx", "/x/a.bmp"), platform::Existence::Yes);
-  names.TakeBack("/out/a.pcx");
+  names.Release("/out/a.pcx");
   EXPECT_EQ(names.Taken("/out/a.pcx", "/x/a.bmp"), platform::Existence::No);
   EXPECT_FALSE(names.TakenByRun(folder.Path("there"), "/x/a.bmp"));
   EXPECT_EQ(names.Taken(folder.Path("there"), "/x/a.bmp"), platform::Existence::Yes);

@@ -4,8 +4,8 @@
 #include <cstdint>
 #include <span>
 
-#include "batch/destination_name.h"
 #include "core/plain_name.h"
+#include "files/numbered_name.h"
 #include "picture/picture_record.h"
 #include "platform/existence.h"
 #include "platform/files.h"
@@ -20,7 +20,6 @@ namespace fotomill::desktop {
 namespace {
 
 constexpr const char* kExtension = ".png";
-constexpr int kMostLostRaces = 100;  // for a name, against other programs
 
 // The first path that is free; empty if there is none.
 std::string FreePath(const std::string& folder) {
@@ -51,20 +50,19 @@ Status Write(const PastedPicture& pasted, const std::string& folder, std::string
   WriteOptions options{.encode = EncodeOptionsFromSettings()};
   options.existing = platform::Existing::Refuse;
   Status status = Status::ErrorCreatingFile;
-  for (int race = 0; race < kMostLostRaces; ++race) {
+  (void)RetryLostRaces([&] {
     path = FreePath(folder);
-    if (path.empty()) break;
+    if (path.empty()) return true;
     status = WritePicture(*picture, path, options);
-    const bool lostRace = status == Status::ErrorCreatingFile && platform::IsRegularFile(path);
-    if (!lostRace) break;
-  }
+    return !LostRace(status, path);
+  });
   return status;
 }
 
 }  // namespace
 
-DeedResult KeepPastedPicture(const PastedPicture& pasted, const std::string& folder) {
-  DeedResult result{FileDeed{DeedKind::Create, {}}, {}};
+FileOperationResult KeepPastedPicture(const PastedPicture& pasted, const std::string& folder) {
+  FileOperationResult result{FileOperation{FileOperationKind::Create, {}}, {}};
   std::string path;
   const Status status = Write(pasted, folder, path);
   if (status == Status::Ok) {

@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-#include "desktop/models/browser/file_deeds.h"
+#include "files/file_operation.h"
 #include "desktop/models/drawing/rgb_image.h"
 
 namespace fotomill::desktop {
@@ -16,7 +16,7 @@ struct PastedPicture {
 };
 
 // Keeps a picture that came from another program: as a PNG file in `folder`, called ClipboardPictureName, or that with a
-// number where the name is taken. The deed makes that file; a failure says why there is none. May take long; any thread.
-DeedResult KeepPastedPicture(const PastedPicture& pasted, const std::string& folder);
+// number where the name is taken. The operation makes that file; a failure says why there is none. May take long; any thread.
+FileOperationResult KeepPastedPicture(const PastedPicture& pasted, const std::string& folder);
 
 }  // namespace fotomill::desktop

@@ -6,7 +6,8 @@
 #include "batch/new_job.h"
 #include "batch/turn_run.h"
 #include "desktop/models/batch/destination_choice.h"
-#include "desktop/models/files/previous_file.h"
+#include "desktop/models/thumbnails/thumbnail.h"
+#include "files/previous_file.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/batch/destination_dialog.h"
 #include "desktop/windows/batch/notification.h"
@@ -57,7 +58,7 @@ void BatchRunner::ReportWaiting() {
 void BatchRunner::StartNext() {
   if (waiting_.empty()) return;
   LeaveBox();
-  written_ = {DeedKind::Create, {}};
+  written_ = {FileOperationKind::Create, {}};
   failed_ = 0;
   Waiting next = std::move(waiting_.front());
   waiting_.pop_front();
@@ -128,7 +129,7 @@ void BatchRunner::BatchEnded(Status status, const BatchJob& job) {
   shell_.Uses().Note(job.uses);
   // Outputs, not files that were given other names.
   if (job.formatIndex != kNoFormat) shell_.Files().NoteDone(std::exchange(written_, {}));
-  if (previous_ != nullptr) shell_.Files().NoteDone(std::exchange(previous_, nullptr)->Deed());
+  if (previous_ != nullptr) shell_.Files().NoteDone(std::exchange(previous_, nullptr)->Operation());
   if (job.filesChanged) shell_.FilesChanged();
   if (!seen_)
     NotifyUser(shell_.Window(), failed_ == 0 ? Label("Batch finished") : Label("Batch finished with errors"), Shown(CountLine(job.progress.Files())));
@@ -178,7 +179,7 @@ void TurnSelection(Shell& shell, Orientation turn) {
   std::vector<BatchFile> files;
   for (const std::string& file : shell.Tabs().SelectedFiles()) files.push_back({.name = file, .below = {}, .hint = {}});
   if (files.empty()) return;
-  auto previous = std::make_shared<PreviousFiles>();
+  auto previous = std::make_shared<PreviousFiles>(DropThumbnails);
   TurnFunction function{.request = {.turn = turn, .seenByExif = settings.ExifAdjustOrientation != 0}, .inPlace = true};
   function.keepPrevious = [previous](const std::string& path) { return previous->Keep(path); };
   function.replaced = [previous](const std::string& path) { previous->Replaced(path); };

@@ -8,13 +8,16 @@
 #include <vector>
 
 #include "desktop/models/batch/batch_thread.h"
-#include "desktop/models/browser/file_deeds.h"
+#include "files/file_operation.h"
 #include "processing/geometry/orient.h"
+
+namespace fotomill {
+class PreviousFiles;
+}
 
 namespace fotomill::desktop {
 
 class Shell;
-class PreviousFiles;
 class ProgressWindow;
 
 // Runs batches for a frame, one after the other, with their progress box and prompts.
@@ -60,7 +63,7 @@ class BatchRunner : public wxEvtHandler, public BatchWindows {
   bool seen_ = false;                        // its end, by the user
   size_t failed_ = 0;                        // files of the batch that runs
   std::shared_ptr<PreviousFiles> previous_;  // of the batch that runs
-  FileDeed written_;                         // by the batch that runs, as far as it can be taken back
+  FileOperation written_;                         // by the batch that runs, as far as it can be taken back
   std::unique_ptr<BatchThread> thread_;
 };
 

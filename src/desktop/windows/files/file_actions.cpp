@@ -13,7 +13,8 @@
 
 #include "core/plain_name.h"
 #include "desktop/models/files/pasted_picture.h"
-#include "desktop/models/files/previous_file.h"
+#include "desktop/models/files/operation_options.h"
+#include "desktop/models/files/turn_one_file.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/dialogs/folder_dialog.h"
 #include "desktop/windows/history/use_recorder.h"
@@ -53,7 +54,7 @@ FileActions::FileActions(Shell& shell) : shell_(shell), undo_(static_cast<size_t
 void FileActions::Run(const std::string& what, Work work, Then then) {
   if (busy_) return shell_.Report(Tr("Please wait for the previous file operation."));
   busy_ = true;
-  const auto result = std::make_shared<DeedResult>();
+  const auto result = std::make_shared<FileOperationResult>();
   const auto run = [this, what, work = std::move(work), result](const StopToken& stop) {
     *result = work([this, &what, &stop](size_t index, size_t count) {
       CallAfter([this, what, index, count] {
@@ -69,19 +70,19 @@ void FileActions::Run(const std::string& what, Work work, Then then) {
   });
 }
 
-void FileActions::Finished(const std::string& what, DeedResult result, const Then& then) {
+void FileActions::Finished(const std::string& what, FileOperationResult result, const Then& then) {
   busy_ = false;
   const std::string done = result.failures.empty() ? what : Tr("%1, %2 failed", what, result.failures.size());
   shell_.Report(result.note.empty() ? done : done + ": " + result.note);
   LogEvent("files",
            what + " done=" + std::to_string(result.done.steps.size()) + " failed=" + std::to_string(result.failures.size()));
-  const std::vector<DeedFailure> failures = result.failures;
+  const std::vector<FileOperationFailure> failures = result.failures;
   then(std::move(result));
   shell_.FilesChanged();
   ReportFailures(failures);
 }
 
-void FileActions::ReportFailures(const std::vector<DeedFailure>& failures) {
+void FileActions::ReportFailures(const std::vector<FileOperationFailure>& failures) {
   if (failures.empty()) return;
   wxString text;
   for (size_t i = 0; i < std::min(failures.size(), kMostFailuresShown); ++i) {
@@ -91,27 +92,30 @@ void FileActions::ReportFailures(const std::vector<DeedFailure>& failures) {
   wxMessageBox(text, Label("Some files failed"), wxOK | wxICON_WARNING, &shell_.Window());
 }
 
-void FileActions::Do(DeedKind kind, const std::vector<std::string>& paths, const std::string& folder) {
+void FileActions::Do(FileOperationKind kind, const std::vector<std::string>& paths, const std::string& folder) {
   if (paths.empty()) return;
-  FileDeed name{kind, std::vector<FileStep>(paths.size(), FileStep{paths.front(), {}})};
-  std::string what = DeedName(name);
+  FileOperation name{kind, std::vector<FileStep>(paths.size(), FileStep{paths.front(), {}})};
+  std::string what = FileOperationName(name);
   what[0] = static_cast<char>(what[0] - 'a' + 'A');
   Run(
-      what, [kind, paths, folder](const DeedProgress& progress) { return CarryOut(PlanDeed(kind, paths, folder), progress); },
-      [this](DeedResult result) {
+      what,
+      [kind, paths, folder, options = FileOperationOptionsFromSettings()](const FileOperationProgress& progress) {
+        return CarryOut(PlanFileOperation(kind, paths, folder, options), options, progress);
+      },
+      [this](FileOperationResult result) {
         Follow(result.done, false);
         undo_.Add(std::move(result.done));
       });
 }
 
-void FileActions::Follow(const FileDeed& deed, bool back) {
-  if (deed.kind != DeedKind::Rename && deed.kind != DeedKind::Move) return;
-  for (const FileStep& step : deed.steps) shell_.FollowRename(back ? step.to : step.from, back ? step.from : step.to);
+void FileActions::Follow(const FileOperation& operation, bool back) {
+  if (operation.kind != FileOperationKind::Rename && operation.kind != FileOperationKind::Move) return;
+  for (const FileStep& step : operation.steps) shell_.FollowRename(back ? step.to : step.from, back ? step.from : step.to);
 }
 
 bool FileActions::Trash(const std::vector<std::string>& paths) {
   if (!paths.empty() && !platform::HasTrash(paths.front())) return Delete(paths);
-  Do(DeedKind::Trash, paths, {});
+  Do(FileOperationKind::Trash, paths, {});
   return true;
 }
 
@@ -139,15 +143,15 @@ bool FileActions::Delete(const std::vector<std::string>& paths) {
   LogEvent("prompt", "delete");
   if (dialog.ShowModal() != wxID_OK) return false;
   Run(
-      Tr("Permanent deletion"), [paths](const DeedProgress& progress) { return DeleteForGood(paths, progress); }, [](DeedResult) {});
+      Tr("Permanent deletion"), [paths](const FileOperationProgress& progress) { return DeleteForGood(paths, progress); }, [](FileOperationResult) {});
   return true;
 }
 
-void FileActions::CopyTo(const std::vector<std::string>& paths, const std::string& folder) { Do(DeedKind::Copy, paths, folder); }
-void FileActions::MoveTo(const std::vector<std::string>& paths, const std::string& folder) { Do(DeedKind::Move, paths, folder); }
+void FileActions::CopyTo(const std::vector<std::string>& paths, const std::string& folder) { Do(FileOperationKind::Copy, paths, folder); }
+void FileActions::MoveTo(const std::vector<std::string>& paths, const std::string& folder) { Do(FileOperationKind::Move, paths, folder); }
 
 void FileActions::Drop(const std::vector<std::string>& paths, const std::string& folder, bool move) {
-  Do(move ? DeedKind::Move : DeedKind::Copy, paths, folder);
+  Do(move ? FileOperationKind::Move : FileOperationKind::Copy, paths, folder);
 }
 
 void FileActions::Rename(const std::string& path, const std::string& name) {
@@ -161,12 +165,14 @@ void FileActions::Rename(const std::string& path, const std::string& name) {
 
 void FileActions::RenameAll(std::vector<FileStep> steps) {
   if (steps.empty()) return;
-  FileDeed deed{DeedKind::Rename, std::move(steps)};
-  const std::string shown(platform::FileNameOf(deed.steps.front().to));
-  const bool one = deed.steps.size() == 1;
+  FileOperation operation{FileOperationKind::Rename, std::move(steps)};
+  const std::string shown(platform::FileNameOf(operation.steps.front().to));
+  const bool one = operation.steps.size() == 1;
   Run(
-      Tr("Rename"), [deed](const DeedProgress& progress) { return CarryOut(deed, progress); },
-      [this, one, shown](DeedResult result) {
+      Tr("Rename"), [operation, options = FileOperationOptionsFromSettings()](const FileOperationProgress& progress) {
+        return CarryOut(operation, options, progress);
+      },
+      [this, one, shown](FileOperationResult result) {
         const bool done = !result.done.steps.empty();
         for (const FileStep& step : result.done.steps) {
           shell_.Uses().Note({FileUse{step.from, FileFunction::MoveAndCopy, kOwnTime, kOwnTime, true}});
@@ -195,8 +201,8 @@ void FileActions::NewFolder(const std::string& parent) {
 
 bool FileActions::SaveTurned(const std::string& path, Orientation turn, Turned then) {
   if (busy_) return false;
-  const auto work = [path, turn](const DeedProgress&) { return TurnOneFile(path, turn); };
-  Run(Tr("Rotation of %1", platform::FileNameOf(path)), work, [this, then = std::move(then)](DeedResult result) {
+  const auto work = [path, turn](const FileOperationProgress&) { return TurnOneFile(path, turn); };
+  Run(Tr("Rotation of %1", platform::FileNameOf(path)), work, [this, then = std::move(then)](FileOperationResult result) {
     const bool done = !result.done.steps.empty();
     const std::string note = result.note;
     undo_.Add(std::move(result.done));
@@ -209,10 +215,12 @@ bool FileActions::SaveTurned(const std::string& path, Orientation turn, Turned t
 
 void FileActions::Undo() {
   if (!undo_.CanUndo() || busy_) return;
-  const FileDeed deed = undo_.TakeUndo();
+  const FileOperation operation = undo_.PopUndo();
   Run(
-      Tr("Undo %1", DeedName(deed)), [deed](const DeedProgress& progress) { return TakeBack(deed, progress); },
-      [this](DeedResult result) {
+      Tr("Undo %1", FileOperationName(operation)), [operation, options = FileOperationOptionsFromSettings()](const FileOperationProgress& progress) {
+        return Revert(operation, options, progress);
+      },
+      [this](FileOperationResult result) {
         Follow(result.done, true);
         undo_.Undone(std::move(result.done));
       });
@@ -220,10 +228,12 @@ void FileActions::Undo() {
 
 void FileActions::Redo() {
   if (!undo_.CanRedo() || busy_) return;
-  const FileDeed deed = undo_.TakeRedo();
+  const FileOperation operation = undo_.PopRedo();
   Run(
-      Tr("Redo %1", DeedName(deed)), [deed](const DeedProgress& progress) { return CarryOut(deed, progress); },
-      [this](DeedResult result) {
+      Tr("Redo %1", FileOperationName(operation)), [operation, options = FileOperationOptionsFromSettings()](const FileOperationProgress& progress) {
+        return CarryOut(operation, options, progress);
+      },
+      [this](FileOperationResult result) {
         Follow(result.done, false);
         undo_.Redone(std::move(result.done));
       });
@@ -272,7 +282,7 @@ void FileActions::Paste(const std::string& folder) {
   }
   std::vector<std::string> paths;
   for (const wxString& name : files.GetFilenames()) paths.push_back(Utf8(name));
-  Do(cut ? DeedKind::Move : DeedKind::Copy, paths, folder);
+  Do(cut ? FileOperationKind::Move : FileOperationKind::Copy, paths, folder);
 }
 
 // With the clipboard open.
@@ -283,8 +293,8 @@ void FileActions::PastePicture(const std::string& folder) {
   }
   Run(
       Tr("Paste"),
-      [picture = PictureOf(bitmap.GetBitmap()), folder](const DeedProgress&) { return KeepPastedPicture(picture, folder); },
-      [this](DeedResult result) {
+      [picture = PictureOf(bitmap.GetBitmap()), folder](const FileOperationProgress&) { return KeepPastedPicture(picture, folder); },
+      [this](FileOperationResult result) {
         const std::vector<FileStep> made = result.done.steps;
         undo_.Add(std::move(result.done));
         BrowserPage* const browser = shell_.Tabs().Front();

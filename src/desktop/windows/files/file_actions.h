@@ -7,7 +7,7 @@
 #include <vector>
 
 #include "core/workers/background_task.h"
-#include "desktop/models/browser/file_deeds.h"
+#include "files/file_operation.h"
 #include "processing/geometry/orient.h"
 
 namespace fotomill::desktop {
@@ -44,7 +44,7 @@ class FileActions : public wxEvtHandler {
   void Undo();
   void Redo();
   // Somebody else did it; it can be taken back like the rest.
-  void NoteDone(FileDeed deed) { undo_.Add(std::move(deed)); }
+  void NoteDone(FileOperation operation) { undo_.Add(std::move(operation)); }
   const UndoList& Undoable() const { return undo_; }
   bool Busy() const { return busy_; }
   void Stop() { task_.Stop(); }
@@ -56,15 +56,15 @@ class FileActions : public wxEvtHandler {
   void Paste(const std::string& folder);
 
  private:
-  using Work = std::function<DeedResult(const DeedProgress& progress)>;
-  using Then = std::function<void(DeedResult result)>;
+  using Work = std::function<FileOperationResult(const FileOperationProgress& progress)>;
+  using Then = std::function<void(FileOperationResult result)>;
   void Run(const std::string& what, Work work, Then then);
-  void Do(DeedKind kind, const std::vector<std::string>& paths, const std::string& folder);
-  void Finished(const std::string& what, DeedResult result, const Then& then);
+  void Do(FileOperationKind kind, const std::vector<std::string>& paths, const std::string& folder);
+  void Finished(const std::string& what, FileOperationResult result, const Then& then);
   void PastePicture(const std::string& folder);
   // Windows that show a renamed or moved folder go with it.
-  void Follow(const FileDeed& deed, bool back);
-  void ReportFailures(const std::vector<DeedFailure>& failures);
+  void Follow(const FileOperation& operation, bool back);
+  void ReportFailures(const std::vector<FileOperationFailure>& failures);
 
   Shell& shell_;
   UndoList undo_;

@@ -213,9 +213,9 @@ std::optional<SequentialRenameRules> SequentialRenameDialog::Ask() {
 
 // What the last run renamed, for the frame's undo.
 void NoteRenames(Shell& shell) {
-  FileDeed deed{DeedKind::Rename, {}};
-  for (const RenamedFile& file : ReadRenameLog().value_or(RenameHistory()).files) deed.steps.push_back({file.from, file.to});
-  shell.Files().NoteDone(std::move(deed));
+  FileOperation operation{FileOperationKind::Rename, {}};
+  for (const RenamedFile& file : ReadRenameLog().value_or(RenameHistory()).files) operation.steps.push_back({file.from, file.to});
+  shell.Files().NoteDone(std::move(operation));
 }
 
 }  // namespace

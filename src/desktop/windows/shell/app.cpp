@@ -10,7 +10,7 @@
 #include <string>
 
 #include "core/data_folder.h"
-#include "desktop/models/files/previous_file.h"
+#include "files/previous_file.h"
 #include "desktop/models/setup/language_choice.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/models/view/view_picture.h"

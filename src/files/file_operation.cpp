@@ -1,21 +1,19 @@
-#include "desktop/models/browser/file_deeds.h"
+#include "files/file_operation.h"
 
 #include <algorithm>
 #include <set>
 
-#include "batch/destination_name.h"
-#include "desktop/models/files/previous_file.h"
-#include "desktop/models/thumbnails/thumbnail.h"
+#include "files/numbered_name.h"
+#include "files/previous_file.h"
 #include "platform/file_view.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/output_file.h"
 #include "platform/paths.h"
-#include "settings/settings.h"
 #include "texts/system_reason.h"
 #include "texts/texts.h"
 
-namespace fotomill::desktop {
+namespace fotomill {
 
 namespace {
 
@@ -114,12 +112,12 @@ Outcome Restore(const std::string& path) {
 }
 
 // The file becomes what it was before, and what it was until now is kept in its place.
-Outcome Exchange(const FileStep& step) {
+Outcome Exchange(const FileStep& step, const FileOperationOptions& options) {
   if (!platform::FileExists(step.from)) return kGone;
   if (step.previous->HasChanged(step.from)) return Tr("It was changed since, so it was left alone.");
   PreviousFile now;
   if (!now.Keep(step.from)) return Tr("There is not enough disk space to keep the current file.");
-  DropThumbnails(step.from);
+  if (options.replacing) options.replacing(step.from);
   Outcome outcome = CopyFile(step.previous->Path(), step.from, platform::Existing::Replace);
   if (!outcome.empty()) return outcome;
   step.previous->Swap(now);
@@ -127,14 +125,14 @@ Outcome Exchange(const FileStep& step) {
   return {};
 }
 
-Outcome DoStep(DeedKind kind, const FileStep& step) {
+Outcome DoStep(FileOperationKind kind, const FileStep& step, const FileOperationOptions& options) {
   switch (kind) {
-    case DeedKind::Rename:
-    case DeedKind::Move: return MoveOne(step.from, step.to);
-    case DeedKind::Copy: return CopyTree(step.from, step.to, 0);
-    case DeedKind::Create: return Restore(step.to);
-    case DeedKind::Turn: return Exchange(step);
-    case DeedKind::Trash: break;
+    case FileOperationKind::Rename:
+    case FileOperationKind::Move: return MoveOne(step.from, step.to);
+    case FileOperationKind::Copy: return CopyTree(step.from, step.to, 0);
+    case FileOperationKind::Create: return Restore(step.to);
+    case FileOperationKind::Turn: return Exchange(step, options);
+    case FileOperationKind::Trash: break;
   }
   return TrashOne(step.from);
 }
@@ -149,61 +147,65 @@ Outcome RemoveCopy(const FileStep& step) {
   return TrashOne(step.to);
 }
 
-Outcome UndoStep(DeedKind kind, const FileStep& step) {
+Outcome UndoStep(FileOperationKind kind, const FileStep& step, const FileOperationOptions& options) {
   switch (kind) {
-    case DeedKind::Rename:
-    case DeedKind::Move: return MoveOne(step.to, step.from);
-    case DeedKind::Copy: return RemoveCopy(step);
-    case DeedKind::Create: return TrashOne(step.to);
-    case DeedKind::Turn: return Exchange(step);
-    case DeedKind::Trash: break;
+    case FileOperationKind::Rename:
+    case FileOperationKind::Move: return MoveOne(step.to, step.from);
+    case FileOperationKind::Copy: return RemoveCopy(step);
+    case FileOperationKind::Create: return TrashOne(step.to);
+    case FileOperationKind::Turn: return Exchange(step, options);
+    case FileOperationKind::Trash: break;
   }
   return Restore(step.from);
 }
 
-
 }  // namespace
 
-FileDeed PlanDeed(DeedKind kind, const std::vector<std::string>& paths, const std::string& folder) {
-  FileDeed deed{kind, {}};
+FileOperation PlanFileOperation(FileOperationKind kind, const std::vector<std::string>& paths, const std::string& folder,
+                                const FileOperationOptions& options) {
+  FileOperation operation{kind, {}};
   std::set<std::string> planned;
   for (const std::string& path : paths) {
-    if (kind == DeedKind::Trash) {
-      deed.steps.push_back({path, {}});
+    if (kind == FileOperationKind::Trash) {
+      operation.steps.push_back({path, {}});
       continue;
     }
     std::string target = platform::JoinFolder(folder, platform::FileNameOf(path));
-    if (kind == DeedKind::Move && target == path) continue;
+    if (kind == FileOperationKind::Move && target == path) continue;
     const TakenTest taken = [&](const std::string& candidate) {
       return planned.contains(candidate) ? platform::Existence::Yes : platform::ExistenceOf(candidate);
     };
-    if (taken(target) == platform::Existence::Yes) (void)MakeNumberedVariant(target, settings.NumberedVariantMin, settings.NumberedVariantMax, taken);
+    if (taken(target) == platform::Existence::Yes) {
+      (void)MakeNumberedVariant(target, options.firstVariant, options.lastVariant, taken);
+    }
     planned.insert(target);
-    deed.steps.push_back({path, target});
+    operation.steps.push_back({path, target});
   }
-  return deed;
+  return operation;
 }
 
-DeedResult CarryOut(const FileDeed& deed, const DeedProgress& progress) {
-  DeedResult result{{deed.kind, {}}, {}};
-  for (size_t i = 0; i < deed.steps.size(); ++i) {
-    if (progress && !progress(i, deed.steps.size())) break;
-    const Outcome outcome = DoStep(deed.kind, deed.steps[i]);
+FileOperationResult CarryOut(const FileOperation& operation, const FileOperationOptions& options,
+                           const FileOperationProgress& progress) {
+  FileOperationResult result{{operation.kind, {}}, {}};
+  for (size_t i = 0; i < operation.steps.size(); ++i) {
+    if (progress && !progress(i, operation.steps.size())) break;
+    const Outcome outcome = DoStep(operation.kind, operation.steps[i], options);
     if (outcome.empty()) {
-      result.done.steps.push_back(deed.steps[i]);
+      result.done.steps.push_back(operation.steps[i]);
     } else {
-      result.failures.push_back({deed.steps[i].from, outcome});
+      result.failures.push_back({operation.steps[i].from, outcome});
     }
   }
   return result;
 }
 
-DeedResult TakeBack(const FileDeed& deed, const DeedProgress& progress) {
-  DeedResult result{{deed.kind, {}}, {}};
-  for (size_t i = deed.steps.size(); i > 0; --i) {
-    if (progress && !progress(deed.steps.size() - i, deed.steps.size())) break;
-    const FileStep& step = deed.steps[i - 1];
-    const Outcome outcome = UndoStep(deed.kind, step);
+FileOperationResult Revert(const FileOperation& operation, const FileOperationOptions& options,
+                           const FileOperationProgress& progress) {
+  FileOperationResult result{{operation.kind, {}}, {}};
+  for (size_t i = operation.steps.size(); i > 0; --i) {
+    if (progress && !progress(operation.steps.size() - i, operation.steps.size())) break;
+    const FileStep& step = operation.steps[i - 1];
+    const Outcome outcome = UndoStep(operation.kind, step, options);
     if (outcome.empty()) {
       result.done.steps.insert(result.done.steps.begin(), step);
     } else {
@@ -213,8 +215,8 @@ DeedResult TakeBack(const FileDeed& deed, const DeedProgress& progress) {
   return result;
 }
 
-DeedResult DeleteForGood(const std::vector<std::string>& paths, const DeedProgress& progress) {
-  DeedResult result{{DeedKind::Trash, {}}, {}};
+FileOperationResult DeleteForGood(const std::vector<std::string>& paths, const FileOperationProgress& progress) {
+  FileOperationResult result{{FileOperationKind::Trash, {}}, {}};
   for (size_t i = 0; i < paths.size(); ++i) {
     if (progress && !progress(i, paths.size())) break;
     const Outcome outcome = DeleteTree(paths[i], 0);
@@ -223,46 +225,46 @@ DeedResult DeleteForGood(const std::vector<std::string>& paths, const DeedProgre
   return result;
 }
 
-std::string DeedName(const FileDeed& deed) {
-  const size_t count = deed.steps.size();
-  const std::string_view name = count == 1 ? platform::FileNameOf(deed.steps[0].from) : std::string_view();
+std::string FileOperationName(const FileOperation& operation) {
+  const size_t count = operation.steps.size();
+  const std::string_view name = count == 1 ? platform::FileNameOf(operation.steps[0].from) : std::string_view();
   const auto named = [&](const char* one, std::string many) { return count == 1 ? Tr(one, name) : std::move(many); };
-  switch (deed.kind) {
-    case DeedKind::Rename: return named(TrLater("rename of %1"), TrCount("rename of %1 file", "rename of %1 files", count));
-    case DeedKind::Move: return named(TrLater("move of %1"), TrCount("move of %1 file", "move of %1 files", count));
-    case DeedKind::Copy: return named(TrLater("copy of %1"), TrCount("copy of %1 file", "copy of %1 files", count));
-    case DeedKind::Create: return named(TrLater("output of %1"), TrCount("output of %1 file", "output of %1 files", count));
-    case DeedKind::Turn: return named(TrLater("rotation of %1"), TrCount("rotation of %1 file", "rotation of %1 files", count));
-    case DeedKind::Trash: break;
+  switch (operation.kind) {
+    case FileOperationKind::Rename: return named(TrLater("rename of %1"), TrCount("rename of %1 file", "rename of %1 files", count));
+    case FileOperationKind::Move: return named(TrLater("move of %1"), TrCount("move of %1 file", "move of %1 files", count));
+    case FileOperationKind::Copy: return named(TrLater("copy of %1"), TrCount("copy of %1 file", "copy of %1 files", count));
+    case FileOperationKind::Create: return named(TrLater("output of %1"), TrCount("output of %1 file", "output of %1 files", count));
+    case FileOperationKind::Turn: return named(TrLater("rotation of %1"), TrCount("rotation of %1 file", "rotation of %1 files", count));
+    case FileOperationKind::Trash: break;
   }
   return named(TrLater("deletion of %1"), TrCount("deletion of %1 file", "deletion of %1 files", count));
 }
 
-void UndoList::Keep(std::vector<FileDeed>& list, FileDeed deed) {
-  if (deed.steps.empty()) return;
-  list.push_back(std::move(deed));
+void UndoList::Keep(std::vector<FileOperation>& list, FileOperation operation) {
+  if (operation.steps.empty()) return;
+  list.push_back(std::move(operation));
   if (list.size() > most_) list.erase(list.begin());
 }
 
-void UndoList::Add(FileDeed deed) {
-  if (deed.steps.empty()) return;
+void UndoList::Add(FileOperation operation) {
+  if (operation.steps.empty()) return;
   undone_.clear();
-  Keep(done_, std::move(deed));
+  Keep(done_, std::move(operation));
 }
 
-FileDeed UndoList::TakeUndo() {
-  FileDeed deed = std::move(done_.back());
+FileOperation UndoList::PopUndo() {
+  FileOperation operation = std::move(done_.back());
   done_.pop_back();
-  return deed;
+  return operation;
 }
 
-FileDeed UndoList::TakeRedo() {
-  FileDeed deed = std::move(undone_.back());
+FileOperation UndoList::PopRedo() {
+  FileOperation operation = std::move(undone_.back());
   undone_.pop_back();
-  return deed;
+  return operation;
 }
 
-void UndoList::Undone(FileDeed deed) { Keep(undone_, std::move(deed)); }
-void UndoList::Redone(FileDeed deed) { Keep(done_, std::move(deed)); }
+void UndoList::Undone(FileOperation operation) { Keep(undone_, std::move(operation)); }
+void UndoList::Redone(FileOperation operation) { Keep(done_, std::move(operation)); }
 
-}  // namespace fotomill::desktop
+}  // namespace fotomill

@@ -1,20 +1,15 @@
-#include "desktop/models/files/previous_file.h"
+#include "files/previous_file.h"
 
 #include <utility>
 
-#include "batch/turn_file.h"
 #include "core/data_folder.h"
 #include "core/whole_number.h"
-#include "desktop/models/thumbnails/thumbnail.h"
 #include "platform/clock.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
-#include "settings/job_options.h"
-#include "settings/settings.h"
-#include "texts/texts.h"
 
-namespace fotomill::desktop {
+namespace fotomill {
 
 namespace {
 
@@ -37,7 +32,7 @@ bool PreviousFile::HasChanged(const std::string& path) const { return !(platform
 bool PreviousFiles::Keep(const std::string& path) {
   auto file = std::make_shared<PreviousFile>();
   if (!file->Keep(path)) return false;
-  DropThumbnails(platform::AbsolutePath(path));
+  if (replacing_) replacing_(platform::AbsolutePath(path));
   const std::lock_guard lock(mutex_);
   return kept_.emplace(platform::AbsolutePath(path), std::move(file)).second;
 }
@@ -50,13 +45,13 @@ void PreviousFiles::Replaced(const std::string& path) {
   replaced_.insert(kept_.extract(kept));
 }
 
-FileDeed PreviousFiles::Deed() {
+FileOperation PreviousFiles::Operation() {
   const std::lock_guard lock(mutex_);
-  FileDeed deed{DeedKind::Turn, {}};
-  for (auto& [path, file] : replaced_) deed.steps.push_back({path, {}, std::move(file)});
+  FileOperation operation{FileOperationKind::Turn, {}};
+  for (auto& [path, file] : replaced_) operation.steps.push_back({path, {}, std::move(file)});
   replaced_.clear();
   kept_.clear();
-  return deed;
+  return operation;
 }
 
 void DeleteOldPreviousFiles() {
@@ -71,22 +66,4 @@ void DeleteOldPreviousFiles() {
   }
 }
 
-DeedResult TurnOneFile(const std::string& path, Orientation turn) {
-  if (platform::FactsOf(path).link)
-    return {{DeedKind::Turn, {}}, {{path, Tr("This is a link; rotate the file it points to.")}}};
-  PreviousFiles previous;
-  WriteOptions options{.encode = EncodeOptionsFromSettings()};
-  bool kept = true;
-  options.makeWay = [&] { return kept = previous.Keep(path); };
-  const TurnRequest request{.turn = turn, .seenByExif = settings.ExifAdjustOrientation != 0};
-  const TurnedFile turned = TurnPictureFile(path, path, request, ReadOptionsFromSettings(), options);
-  if (turned.changed) previous.Replaced(path);
-  DeedResult result{previous.Deed(), {}, turned.note.shown};
-  if (turned.status != Status::Ok) {
-    const std::string hint = kept ? turned.hint : std::string(Tr("There is not enough disk space to keep the old file for undo."));
-    result.failures.push_back({path, Tr(StatusMessage(turned.status)) + (hint.empty() ? "" : " ") + hint});
-  }
-  return result;
-}
-
-}  // namespace fotomill::desktop
+}  // namespace fotomill

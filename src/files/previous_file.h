@@ -1,18 +1,19 @@
 #pragma once
 
+#include <functional>
 #include <map>
 #include <memory>
 #include <mutex>
 #include <string>
+#include <utility>
 
-#include "desktop/models/browser/file_deeds.h"
+#include "files/file_operation.h"
 #include "platform/held_file.h"
 #include "platform/temporary_file.h"
-#include "processing/geometry/orient.h"
 
-namespace fotomill::desktop {
+namespace fotomill {
 
-// What a file was before a function replaced it, kept in the data folder until nobody can take that back any more.
+// What a file was before a function replaced it, kept in the data folder until nobody can undo that any more.
 class PreviousFile {
  public:
   // Keeps the file as it is now. False if there is no room for it.
@@ -32,14 +33,17 @@ class PreviousFile {
 // The previous files of one batch; from any thread.
 class PreviousFiles {
  public:
-  // To be called before a file is replaced; its thumbnails go. False: it should not be.
+  // `replacing` is told of each file before it is replaced, on the thread that replaces it.
+  explicit PreviousFiles(std::function<void(const std::string& path)> replacing = {}) : replacing_(std::move(replacing)) {}
+  // To be called before a file is replaced. False: it should not be.
   [[nodiscard]] bool Keep(const std::string& path);
   // To be called at once when a file that was kept has been replaced; what it becomes later is somebody else's work.
   void Replaced(const std::string& path);
-  // The deed of those that were replaced, in the order of their paths; they are handed over.
-  FileDeed Deed();
+  // The operation of those that were replaced, in the order of their paths; they are handed over.
+  FileOperation Operation();
 
  private:
+  const std::function<void(const std::string& path)> replacing_;
   std::mutex mutex_;
   std::map<std::string, std::shared_ptr<PreviousFile>> kept_, replaced_;
 };
@@ -47,7 +51,4 @@ class PreviousFiles {
 // Deletes what a program that was killed a month ago or longer left in the data folder.
 void DeleteOldPreviousFiles();
 
-// Turns the picture in a file and keeps what the file was. Neither step nor failure where it stands so already.
-DeedResult TurnOneFile(const std::string& path, Orientation turn);
-
-}  // namespace fotomill::desktop
+}  // namespace fotomill

@@ -1,0 +1,13 @@
+#pragma once
+
+#include <string>
+
+#include "files/file_operation.h"
+#include "processing/geometry/orient.h"
+
+namespace fotomill::desktop {
+
+// Turns the picture in a file and keeps what the file was. Neither step nor failure where it stands so already.
+FileOperationResult TurnOneFile(const std::string& path, Orientation turn);
+
+}  // namespace fotomill::desktop

@@ -1,0 +1,106 @@
+#include "files/file_operation.h"
+
+#include <gmock/gmock.h>
+
+#include "platform/files.h"
+#include "support/files.h"
+#include "support/scoped_environment.h"
+
+namespace fotomill {
+namespace {
+
+using test::ReadText;
+using test::WriteText;
+using testing::ElementsAre;
+using testing::IsEmpty;
+
+class FileOperationTest : public testing::Test {
+ protected:
+  FileOperationTest() : data_("XDG_DATA_HOME", folder_.Path("data")) {
+    for (const char* name : {"from", "to", "from/sub"}) std::filesystem::create_directory(folder_.Path(name));
+    for (const char* name : {"a.png", "b.png", "sub/c.png"}) WriteText(From(name), name);
+  }
+  std::string From(std::string_view name) const { return folder_.Path("from/" + std::string(name)); }
+  std::string To(std::string_view name) const { return folder_.Path("to/" + std::string(name)); }
+  std::vector<std::string> Names(const char* folder) const {
+    std::vector<std::string> names;
+    for (const auto& entry : std::filesystem::directory_iterator(folder_.Path(folder))) names.push_back(entry.path().filename());
+    std::sort(names.begin(), names.end());
+    return names;
+  }
+  test::TemporaryFolder folder_;
+  test::ScopedEnvironment data_;
+};
+
+TEST_F(FileOperationTest, EveryOperationCanBeUndoneAndRedone) {
+  for (const FileOperationKind kind : {FileOperationKind::Move, FileOperationKind::Copy, FileOperationKind::Trash}) {
+    SCOPED_TRACE(static_cast<int>(kind));
+    const FileOperationResult done = CarryOut(PlanFileOperation(kind, {From("a.png"), From("sub")}, folder_.Path("to")));
+    ASSERT_THAT(done.failures, IsEmpty());
+    EXPECT_EQ(Names("from").size(), kind == FileOperationKind::Copy ? 3u : 1u);
+    EXPECT_EQ(Names("to").size(), kind == FileOperationKind::Trash ? 0u : 2u);
+    const FileOperationResult undone = Revert(done.done);
+    EXPECT_THAT(undone.failures, IsEmpty());
+    EXPECT_THAT(Names("from"), ElementsAre("a.png", "b.png", "sub"));
+    EXPECT_THAT(Names("to"), IsEmpty());
+    EXPECT_EQ(ReadText(From("sub/c.png")), "sub/c.png");
+    const FileOperationResult again = CarryOut(undone.done);
+    EXPECT_THAT(again.failures, IsEmpty());
+    EXPECT_THAT(Revert(again.done).failures, IsEmpty());
+  }
+}
+
+TEST_F(FileOperationTest, NothingIsEverReplaced) {
+  WriteText(To("a.png"), "there");
+  const FileOperation plan = PlanFileOperation(FileOperationKind::Copy, {From("a.png")}, folder_.Path("to"));
+  EXPECT_EQ(plan.steps[0].to, To("a [1].png"));
+  WriteText(To("a [1].png"), "came meanwhile");
+  for (const FileOperationKind kind : {FileOperationKind::Move, FileOperationKind::Copy}) {
+    const FileOperationResult result = CarryOut({kind, plan.steps});
+    EXPECT_THAT(result.done.steps, IsEmpty());
+    EXPECT_EQ(result.failures.at(0).reason, "A file of that name already exists.");
+  }
+  EXPECT_EQ(ReadText(To("a.png")) + ReadText(To("a [1].png")) + ReadText(From("a.png")), "therecame meanwhilea.png");
+  // Undoing a move whose old name was given away leaves both files.
+  const FileOperationResult moved = CarryOut(PlanFileOperation(FileOperationKind::Move, {From("b.png")}, folder_.Path("to")));
+  WriteText(From("b.png"), "new");
+  EXPECT_EQ(Revert(moved.done).failures.size(), 1u);
+  EXPECT_EQ(ReadText(From("b.png")) + ReadText(To("b.png")), "newb.png");
+  // A copy that was worked on stays as well.
+  const FileOperationResult copied = CarryOut(PlanFileOperation(FileOperationKind::Copy, {From("sub/c.png")}, folder_.Path("to")));
+  WriteText(To("c.png"), "was worked on");
+  EXPECT_EQ(Revert(copied.done).failures.size(), 1u);
+  EXPECT_EQ(ReadText(To("c.png")), "was worked on");
+}
+
+TEST_F(FileOperationTest, AFolderDoesNotGoIntoItself) {
+  for (const FileOperationKind kind : {FileOperationKind::Move, FileOperationKind::Copy}) {
+    EXPECT_EQ(CarryOut(PlanFileOperation(kind, {From("sub")}, From("sub"))).failures.size(), 1u);
+  }
+  EXPECT_THAT(Names("from/sub"), ElementsAre("c.png"));
+  // Links are deleted, never what they lead to.
+  std::filesystem::create_directory_symlink(folder_.Path("to"), From("sub/link"));
+  WriteText(To("kept"), "kept");
+  EXPECT_THAT(DeleteForGood({From("sub")}).failures, IsEmpty());
+  EXPECT_THAT(Names("from"), ElementsAre("a.png", "b.png"));
+  EXPECT_EQ(ReadText(To("kept")), "kept");
+}
+
+TEST(UndoList, KeepsSoMany) {
+  UndoList list(2);
+  const auto operation = [](const char* name) { return FileOperation{FileOperationKind::Rename, {{name, "x"}}}; };
+  for (const char* name : {"a", "b", "c"}) list.Add(operation(name));
+  list.Add({});
+  EXPECT_EQ(list.UndoName(), "rename of c");
+  list.Undone(list.PopUndo());
+  EXPECT_EQ(list.RedoName(), "rename of c");
+  list.Redone(list.PopRedo());
+  list.Undone(list.PopUndo());
+  list.Undone(list.PopUndo());
+  EXPECT_FALSE(list.CanUndo());
+  list.Add(operation("d"));
+  EXPECT_FALSE(list.CanRedo());
+}
+
+}  // namespace
+}  // namespace fotomill
