@@ -10,6 +10,7 @@
 
 namespace fotomill {
 
+// PNG specification, section 5.2.
 inline constexpr std::string_view kPngSignature("\x89PNG\r\n\x1a\n", 8);
 
 // Where a chunk is in its file; it may claim more than there is.

@@ -12,6 +12,7 @@ namespace fotomill {
 
 // What a Photoshop document holds, as views into the file. The layout of the file is told in psd_file.cpp.
 
+// Color modes of a Photoshop file, by the numbers of its header.
 enum class PsdMode : uint16_t { Bitmap = 0, Gray = 1, Indexed = 2, Rgb = 3, Cmyk = 4, Multichannel = 7, Duotone = 8, Lab = 9 };
 
 // Numbers of the resources that matter here.
@@ -26,8 +27,9 @@ enum class PsdResource : uint16_t {
   ChannelInfoNew = 1077,
 };
 
-inline constexpr int32_t kLongestPsdSide = 30000;
+inline constexpr int32_t kLongestPsdSide = 30000;  // pixels
 
+// What the header of a file says.
 struct PsdHeader {
   uint16_t channels = 0;
   int32_t width = 0, height = 0;
@@ -41,11 +43,13 @@ struct PsdHeader {
 // Numbers of channels of a layer.
 inline constexpr int16_t kPsdTransparency = -1;
 
+// One channel of a layer, and where its data are.
 struct PsdChannel {
   int16_t number = 0;             // from 0 the colors, kPsdTransparency, -2 and below masks
   std::span<const uint8_t> data;  // a compression, 2 bytes, and the rows
 };
 
+// One layer, with its place in the picture.
 struct PsdLayer {
   int32_t top = 0, left = 0, bottom = 0, right = 0;  // on the canvas, which it may leave
   std::vector<PsdChannel> channels;
@@ -54,6 +58,7 @@ struct PsdLayer {
   const PsdChannel* Channel(int16_t number) const;
 };
 
+// The parts of a file.
 struct PsdFile {
   PsdHeader header;
   std::span<const uint8_t> colorTable;  // of an indexed picture: 256 reds, then the greens, then the blues

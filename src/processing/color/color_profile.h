@@ -6,6 +6,7 @@
 
 namespace fotomill {
 
+// Closes a profile of the library when its owner goes.
 struct CloseProfile {
   void operator()(void* profile) const;
 };

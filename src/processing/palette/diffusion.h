@@ -34,7 +34,7 @@ class WideDiffuser {
   Status Open(Dither dither, int32_t width, bool serpentine, int32_t handedOn);
   // As ErrorDiffuser: a row of pixels to indices, a row of brightnesses to 0 and 1.
   void Row(const uint8_t* bgr, NearestColor& nearest, uint8_t* indices);
-  void GrayRow(const uint8_t* gray, uint8_t* indices);
+  void GrayRow(const uint8_t* gray, uint8_t* indices);  // one byte a pixel
 
  private:
   static constexpr int32_t kRows = 3, kReach = 2;  // of a kernel

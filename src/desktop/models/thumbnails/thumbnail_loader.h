@@ -67,7 +67,7 @@ class ThumbnailCache {
   void Put(const ThumbnailRequest& request, ThumbnailPointer thumbnail);
   void Clear();
   uint64_t Bytes() const { return bytes_; }  // of all thumbnails in it
-  size_t Count() const { return entries_.size(); }
+  size_t Count() const { return entries_.size(); }  // thumbnails in it
 
  private:
   struct Entry {

@@ -31,6 +31,7 @@ class Background {
           });
         });
   }
+  // Asks the work to stop and waits for it; `done` is not called any more.
   void Stop() {
     wanted_.reset();
     task_.StopAndWait();

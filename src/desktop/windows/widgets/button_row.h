@@ -12,7 +12,7 @@ namespace fotomill::desktop {
 struct RowButton {
   wxWindowID id;
   const char* label;  // in English
-  std::function<void()> run;
+  std::function<void()> run;  // when the button is pressed
 };
 
 // The buttons at the foot of a frame, on its panel, the one that closes it apart at the right. A button runs when it is pressed

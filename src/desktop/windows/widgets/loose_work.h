@@ -37,6 +37,7 @@ class LooseWork {
     });
     if (!begun) report(std::move(failed));
   }
+  // Does not wait; what the work reports from here on is dropped.
   void Stop() {
     if (source_) source_->Stop();
     source_.reset();
