@@ -12,8 +12,8 @@ void TurnFile(std::span<const uint8_t> file) {
   const uint8_t choice = file.empty() ? uint8_t{0} : file.back();
   std::vector<uint8_t> made;
   JpegTurnResult result;
-  const JpegTurnWish wish{.turn = static_cast<Orientation>(1 + choice % 8), .trim = (choice & 8) != 0};
-  if (MakeTurnedJpeg(file, wish, made, result) != Status::Ok || made.empty()) return;
+  const JpegTurnRequest request{.turn = static_cast<Orientation>(1 + choice % 8), .trim = (choice & 8) != 0};
+  if (MakeTurnedJpeg(file, request, made, result) != Status::Ok || made.empty()) return;
   JpegHead head;
   fuzz::Require(ParseJpegHead(made, head) == Status::Ok);
 }
