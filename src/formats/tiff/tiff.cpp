@@ -264,11 +264,11 @@ std::vector<uint64_t> PageOffsets(const TiffInput& input) {
 // Opens a page and fills the facts.
 Status Describe(TiffInput& input, int32_t page, TiffLayout& layout, PictureRecord& picture) {
   RETURN_IF_BAD(input.Open());
-  TIFF* tiff = input.Handle();
   const std::vector<uint64_t> offsets = PageOffsets(input);
   const size_t pages = std::max<size_t>(offsets.size(), 1);
   if (page < 0 || static_cast<size_t>(page) >= pages) return Status::NoImages;
-  if (page > 0 && TIFFSetSubDirectory(tiff, offsets[static_cast<size_t>(page)]) == 0) return input.Failure();
+  if (page > 0) RETURN_IF_BAD(input.OpenAt(offsets[static_cast<size_t>(page)]));
+  TIFF* tiff = input.Handle();
   RETURN_IF_BAD(ReadLayout(tiff, layout));
   picture.pageCount = static_cast<int32_t>(pages);
   picture.typeName.AssignCut(TIFFIsBigTIFF(tiff) != 0 ? "BigTIFF" : "TIFF");

@@ -88,6 +88,26 @@ Status TiffInput::Open() {
   return tiff_ != nullptr ? Status::Ok : Failure();
 }
 
+Status TiffInput::OpenAt(uint64_t directory) {
+  TIFFClose(tiff_);
+  tiff_ = nullptr;
+  position_ = 0;
+  directory_ = directory;
+  return Open();
+}
+
+// Puts the directory's offset into what was read of the header from `offset` on: behind the 4 bytes of signature and
+// version, in BigTIFF behind 8.
+void TiffInput::NameDirectory(uint64_t offset, std::span<uint8_t> bytes) const {
+  const bool bigEndian = bytes_[0] == 'M', big = (bigEndian ? bytes_[3] : bytes_[2]) == 43;
+  const uint64_t field = big ? 8 : 4, size = field;
+  for (uint64_t i = 0; i < size; ++i) {
+    const uint64_t place = field + i;
+    if (place < offset || place - offset >= bytes.size()) continue;
+    bytes[place - offset] = static_cast<uint8_t>(directory_ >> 8 * (bigEndian ? size - 1 - i : i));
+  }
+}
+
 Status TiffInput::Failure() const {
   const std::string_view message(messages_.error);
   const auto says = [&](std::string_view words) { return message.find(words) != std::string_view::npos; };
@@ -104,6 +124,7 @@ tmsize_t TiffInput::Read(void* target, tmsize_t count) {
   if (count <= 0 || position_ >= bytes_.size()) return 0;
   const size_t taken = std::min(static_cast<size_t>(count), static_cast<size_t>(bytes_.size() - position_));
   std::memcpy(target, bytes_.data() + position_, taken);
+  if (directory_ != 0) NameDirectory(position_, {static_cast<uint8_t*>(target), taken});
   position_ += taken;
   return static_cast<tmsize_t>(taken);
 }

@@ -27,6 +27,9 @@ class TiffInput {
 
   // Ok; FileReadError (3) when the file ends too early, DamagedFile (2) when it is none or its directory makes no sense.
   Status Open();
+  // Opens the file again at another directory, as if its header named that one: the library would otherwise follow the whole
+  // chain for each page. Statuses of Open.
+  Status OpenAt(uint64_t directory);
   // What a failed call of the library means, by its message.
   Status Failure() const;
   TIFF* Handle() const { return tiff_; }  // of the library; null until Open
@@ -38,8 +41,11 @@ class TiffInput {
   uint64_t Seek(uint64_t offset, int from);
 
  private:
+  void NameDirectory(uint64_t offset, std::span<uint8_t> bytes) const;
+
   std::span<const uint8_t> bytes_;
   uint64_t position_ = 0;
+  uint64_t directory_ = 0;  // what the header is said to name; 0: what it does name
   TIFF* tiff_ = nullptr;
   TiffMessages messages_;
 };
