@@ -178,7 +178,8 @@ void RecordedText::Append(const RecordedText& more) {
 std::string TrCountArguments(const char* one, const char* many, uint64_t count, std::initializer_list<TextArgument> arguments) {
   const char* const english = count == 1 ? one : many;
   const char* const text = state.translated ? dngettext(kDomain, one, many, static_cast<unsigned long>(count)) : english;
-  std::vector<TextArgument> all{ThousandsText(count)};
+  // Scripts read the English lines, so their numbers are plain.
+  std::vector<TextArgument> all{state.translated ? ThousandsText(count) : std::to_string(count)};
   all.insert(all.end(), arguments);
   return Filled(text, all);
 }

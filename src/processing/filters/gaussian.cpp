@@ -20,6 +20,7 @@ constexpr double kCut = 4;          // sigmas
 constexpr double kGrid = 0.7;       // distance of the coarse grid, in sigmas
 constexpr int32_t kMostShift = 15;  // precision of weights: sums of samples stay below 2^31
 constexpr size_t kSpare = 8;        // samples that a pass may write behind a row's end
+constexpr size_t kReadAhead = 64;   // samples that a pass may read behind a row's end, with a weight of 0
 constexpr int32_t kLeastRows = 32;  // of a band
 constexpr int32_t kOpaque = 255 << kFraction;
 
@@ -54,7 +55,8 @@ class WeightSets {
       largest = std::max(largest, *std::ranges::max_element(set.shares));
       longest = std::max(longest, set.shares.size());
     }
-    taps_ = RoundUp(static_cast<int32_t>(longest), kTapGroup);
+    longest_ = static_cast<int32_t>(longest);
+    taps_ = RoundUp(longest_, kTapGroup);
     shift_ = kMostShift;
     while (std::ldexp(largest, shift_) > INT16_MAX - 1) --shift_;
     weights_.assign(sets.size() * static_cast<size_t>(taps_), 0);
@@ -72,6 +74,7 @@ class WeightSets {
     }
   }
   int32_t Taps() const { return taps_; }
+  int32_t Longest() const { return longest_; }  // taps without the zeros
   int32_t Shift() const { return shift_; }
   // The window of set `s`, moved by `move` numbers.
   FilterWindow Window(size_t s, int32_t move) const {
@@ -81,7 +84,7 @@ class WeightSets {
  private:
   std::vector<int16_t> weights_;
   std::vector<int32_t> firsts_;
-  int32_t taps_ = 0, shift_ = 0;
+  int32_t taps_ = 0, longest_ = 0, shift_ = 0;
 };
 
 // One edge of the picture: its pixels, and the cells of the coarse grid. Cell g has its center at (g + 1/2) d - 1/2, counted
@@ -107,9 +110,8 @@ struct Axis {
     for (int32_t p = 0; p < grid; ++p) phases.emplace_back(p - middle, half, grid);
     up.Make(phases);
     firstCell = CellsOf(0).first;
-    const FilterWindow last = CellsOf(count - 1);
-    cells = 0;
-    for (int32_t x = std::max(0, count - grid); x < count; ++x) cells = std::max(cells, CellsOf(x).first + last.taps - firstCell);
+    cells = 0;  // those behind, which have no weight, are not computed: their pixels may be far outside
+    for (int32_t x = std::max(0, count - grid); x < count; ++x) cells = std::max(cells, CellsOf(x).first + up.Longest() - firstCell);
     const int32_t least = firstCell;
     for (int32_t x = 0; x < std::min(grid, count); ++x) firstCell = std::min(firstCell, CellsOf(x).first);
     cells += least - firstCell;
@@ -163,8 +165,8 @@ class GaussianRows {
     stride_ = RoundUp(plan.samples + kSpare, static_cast<size_t>(kWeighedAtOnce));
     held_ = plan.down.grid == 1 ? 0 : plan.down.up.Taps();
     const auto pointers = static_cast<size_t>(std::max(plan.down.down.Taps(), held_));
-    const bool room = padded_.Allocate((padded + kWeighedAtOnce + kSpare) * sizeof(int16_t)) &&
-                      cells_.Allocate((cellRow + kWeighedAtOnce + kSpare) * sizeof(int16_t)) &&
+    const bool room = padded_.Allocate((padded + kWeighedAtOnce + kReadAhead) * sizeof(int16_t)) &&
+                      cells_.Allocate((cellRow + kWeighedAtOnce + kReadAhead) * sizeof(int16_t)) &&
                       ring_.Allocate(stride_ * static_cast<size_t>(held_) * sizeof(int16_t) + 1) &&
                       rows_.Allocate(stride_ * sizeof(int16_t)) && sums_.Allocate(plan.samples * sizeof(int32_t)) &&
                       pointers_.Allocate(pointers * sizeof(void*));
