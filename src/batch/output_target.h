@@ -28,7 +28,7 @@ struct OutputTarget {
   const BatchOutput* output = nullptr;
   int32_t formatIndex = kNoFormat;
   std::string extension;
-  bool kept = false;  // the source's own format, which nobody asked for
+  bool kept = false;  // the source's own format, not one that was requested
   std::string path;   // empty until the picture is there, where the name needs it
 };
 

@@ -17,10 +17,10 @@ namespace fotomill {
 std::string FileUri(std::string_view path);
 
 // The system's thumbnail of a picture as a record of its own, from the first of these folders and of "x-large" and "xx-large" (512
-// and 1024 pixels) that is made for `side` pixels at least. Null if there is none that is valid.
+// and 1024 pixels) that is made for `side` pixels at least. Null without a valid one.
 PicturePointer ReadSystemPicture(const std::string& picturePath, int32_t side);
 
-// Fills a large record with the system's thumbnail of a picture. False if there is none that is valid; `record` is
+// Fills a large record with the system's thumbnail of a picture. False without a valid one; `record` is
 // then as before.
 bool ReadSystemThumbnail(const std::string& picturePath, Color matte, LargeThumbnailRecord& record);
 

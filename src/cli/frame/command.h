@@ -60,7 +60,7 @@ struct CommandContext {
   NameArguments names;
   std::function<int()> run;  // after parsing; returns the exit status
 
-  // Whether there is somebody to ask.
+  // Whether the user can be asked.
   bool MayAsk() const { return io.Interactive() && !global.noInput; }
   // Whether to draw a progress bar.
   bool ProgressOn() const { return io.errTerminal && !global.quiet && global.progress != "never"; }

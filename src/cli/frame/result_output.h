@@ -53,7 +53,7 @@ class ResultOutput {
 
   // Progress on a terminal: either set each time, or counted by CountFile up to `files`.
   void ShowProgress(uint64_t done, uint64_t total);
-  void Expect(uint64_t files);  // so many are going to be counted by CountFile
+  void Expect(uint64_t files);  // how many files CountFile will count
   // Redraws the progress if it is time.
   void Tick() { progress_.Tick(); }
   // Flushes everything and clears the progress line, before a question.

@@ -18,7 +18,7 @@ class TerminalProgress {
 
   // Starts at 0 of `total`, and counts on to `done` of them; Tick draws it.
   void Begin(uint64_t total);
-  void Done(uint64_t done);  // so many of the total; Tick draws it
+  void Done(uint64_t done);  // how much of the total is done; Tick draws it
   // Draws the line if it is time.
   void Tick();
   // Clears the line, before anything else is printed.
