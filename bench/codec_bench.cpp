@@ -19,15 +19,19 @@ PicturePointer MakePicture(Content content, int32_t depth, Size size) {
   picture->width = size.width;
   picture->height = size.height;
   picture->bitsPerPixel = depth;
-  MakeDefaultPalette(&picture->palette, nullptr, depth == 1 ? kBlackAndWhitePalette : kDisplayPalette);
-  if (NewPackedImage(size.width, size.height, &picture->palette, depth, picture->image) != Status::Ok) return nullptr;
+  MakeDefaultPalette(&picture->palette, nullptr,
+                     depth == 1 ? kBlackAndWhitePalette : kDisplayPalette);
+  if (NewPackedImage(size.width, size.height, &picture->palette, depth, picture->image) !=
+      Status::Ok)
+    return nullptr;
   uint32_t state = 1;
   for (int32_t y = 0; y < size.height; ++y) {
     const auto row = picture->image.Row(y);
     for (size_t i = 0; i < row.size(); ++i) {
       state = state * 1664525 + 1013904223;
-      const size_t level = content == Content::Flat ? i / 200 * 50 + static_cast<size_t>(y / 40 * 7)
-                                                    : 60 + 120 * i / row.size() + (state >> 29) + (state >> 26 & 7);
+      const size_t level = content == Content::Flat
+                               ? i / 200 * 50 + static_cast<size_t>(y / 40 * 7)
+                               : 60 + 120 * i / row.size() + (state >> 29) + (state >> 26 & 7);
       row[i] = static_cast<uint8_t>(level);
     }
   }
@@ -39,10 +43,12 @@ std::string FileName(const char* extension) {
 }
 
 void SetBytes(benchmark::State& state, const PackedImage& image) {
-  state.SetBytesProcessed(static_cast<int64_t>(state.iterations()) * static_cast<int64_t>(image.Rows().size()));
+  state.SetBytesProcessed(static_cast<int64_t>(state.iterations()) *
+                          static_cast<int64_t>(image.Rows().size()));
 }
 
-void Encode(benchmark::State& state, const char* extension, Content content, int32_t depth, Size size) {
+void Encode(benchmark::State& state, const char* extension, Content content, int32_t depth,
+            Size size) {
   const PicturePointer picture = MakePicture(content, depth, size);
   const std::string name = FileName(extension);
   const FormatEntry& row = FormatRow(FindFormatByName(name));
@@ -56,7 +62,8 @@ void Encode(benchmark::State& state, const char* extension, Content content, int
   SetBytes(state, picture->image);
 }
 
-void Decode(benchmark::State& state, const char* extension, Content content, int32_t depth, Size size) {
+void Decode(benchmark::State& state, const char* extension, Content content, int32_t depth,
+            Size size) {
   const PicturePointer source = MakePicture(content, depth, size);
   const std::string name = FileName(extension);
   const FormatEntry& row = FormatRow(FindFormatByName(name));
@@ -99,8 +106,10 @@ void RegisterCodec(const char* extension, std::initializer_list<int32_t> depths,
   for (const int32_t depth : depths) {
     for (const auto& kind : kContents) {
       const std::string tail = std::string("/") + kind.name + "/" + std::to_string(depth);
-      benchmark::RegisterBenchmark((extension + ("/decode" + tail)).c_str(), Decode, extension, kind.content, depth, size);
-      benchmark::RegisterBenchmark((extension + ("/encode" + tail)).c_str(), Encode, extension, kind.content, depth, size);
+      benchmark::RegisterBenchmark((extension + ("/decode" + tail)).c_str(), Decode, extension,
+                                   kind.content, depth, size);
+      benchmark::RegisterBenchmark((extension + ("/encode" + tail)).c_str(), Encode, extension,
+                                   kind.content, depth, size);
     }
   }
 }

@@ -1,4 +1,5 @@
-// Scaling, color reduction, turning and flattening of a picture of 6 megapixels, in source pixels per second.
+// Scaling, color reduction, turning and flattening of a picture of 6 megapixels, in source pixels
+// per second.
 #include <benchmark/benchmark.h>
 
 #include <cmath>
@@ -26,7 +27,8 @@ PicturePointer MakePhotograph() {
     for (int32_t x = 0; x < kWidth; ++x, pixel += 3) {
       noise = noise * 1664525 + 1013904223;
       for (int c = 0; c < 3; ++c) {
-        const double wave = std::sin(x / (200.0 + 90 * c)) + std::cos(y / (300.0 - 70 * c)) + std::sin((x + y) / 37.0) / 4;
+        const double wave = std::sin(x / (200.0 + 90 * c)) + std::cos(y / (300.0 - 70 * c)) +
+                            std::sin((x + y) / 37.0) / 4;
         pixel[c] = static_cast<uint8_t>(124 + 50 * wave + (noise >> (24 + c) & 7));
       }
     }
@@ -39,7 +41,9 @@ const PictureRecord& Photograph() {
   return *picture;
 }
 
-void CountPixels(benchmark::State& state) { state.SetItemsProcessed(state.iterations() * kWidth * kHeight); }
+void CountPixels(benchmark::State& state) {
+  state.SetItemsProcessed(state.iterations() * kWidth * kHeight);
+}
 
 void Scale(benchmark::State& state, Size size, ScaleFilter filter, bool withAlpha) {
   PackedImage alpha, image, plane;
@@ -48,7 +52,8 @@ void Scale(benchmark::State& state, Size size, ScaleFilter filter, bool withAlph
     for (size_t i = 0; i < alpha.Rows().size(); ++i) alpha.Rows()[i] = static_cast<uint8_t>(i >> 4);
   }
   for (auto _ : state) {
-    if (ScaleFiltered(Photograph().image, alpha, size, filter, image, plane) != Status::Ok) std::abort();
+    if (ScaleFiltered(Photograph().image, alpha, size, filter, image, plane) != Status::Ok)
+      std::abort();
   }
   CountPixels(state);
 }
@@ -93,7 +98,9 @@ BENCHMARK_CAPTURE(Reduce, mono_threshold, 1, Dither::None)->Unit(benchmark::kMil
 BENCHMARK_CAPTURE(Reduce, mono_diffused, 1, Dither::FloydSteinberg)->Unit(benchmark::kMillisecond);
 
 void Orient(benchmark::State& state) {
-  OnCopies(state, [](PictureRecord& picture) { return OrientPicture(picture, Orientation::QuarterRight); });
+  OnCopies(state, [](PictureRecord& picture) {
+    return OrientPicture(picture, Orientation::QuarterRight);
+  });
 }
 BENCHMARK(Orient)->Unit(benchmark::kMillisecond);
 

@@ -1,4 +1,5 @@
-// An EXIF block: the walk with every text, the raw copies of its values, and the changes that writers make to it.
+// An EXIF block: the walk with every text, the raw copies of its values, and the changes that
+// writers make to it.
 
 #include <cstdlib>
 #include <string>
@@ -13,7 +14,8 @@ namespace {
 
 using namespace fotomill;
 
-// Small limits: the walk meets each of them now and then, and hostile inputs cost no more time than others.
+// Small limits: the walk meets each of them now and then, and hostile inputs cost no more time than
+// others.
 [[maybe_unused]] const bool limitsSet = [] {
   limits.exifDirectories = 16;
   limits.exifEntries = 512;

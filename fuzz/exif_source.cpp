@@ -1,4 +1,5 @@
-// A picture file in which an EXIF block is looked for. The search reads files, so each input becomes one.
+// A picture file in which an EXIF block is looked for. The search reads files, so each input
+// becomes one.
 
 #include <cstdlib>
 

@@ -9,7 +9,8 @@
 #include "settings/settings.h"
 #include "support/scratch_file.h"
 
-// What was read from a history file is what is read after it was saved, and recording adds one entry in front.
+// What was read from a history file is what is read after it was saved, and recording adds one
+// entry in front.
 
 namespace {
 
@@ -20,7 +21,8 @@ std::vector<std::string> List() {
   std::vector<std::string> list;
   for (size_t i = 0; i < FileHistoryCount(); ++i) {
     const FileHistoryEntry entry = FileHistoryAt(i);
-    list.push_back(std::string(entry.path) + "\t" + std::to_string(entry.function) + "\t" + std::to_string(entry.accessed));
+    list.push_back(std::string(entry.path) + "\t" + std::to_string(entry.function) + "\t" +
+                   std::to_string(entry.accessed));
   }
   return list;
 }
@@ -35,10 +37,12 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
   settings.FileHistoryFunctions = 0xfffff;
   settings.FileHistoryWindowType = size & 1;
   ClearFileHistory();
-  Require(platform::WriteWholeFile(FileHistoryPath(HistoryOptionsFromSettings()), {reinterpret_cast<const char*>(data), size}));
+  Require(platform::WriteWholeFile(FileHistoryPath(HistoryOptionsFromSettings()),
+                                   {reinterpret_cast<const char*>(data), size}));
   if (!LoadFileHistory(HistoryOptionsFromSettings())) return 0;
   const std::vector<std::string> list = List();
-  for (size_t i = 1; i < list.size(); ++i) Require(FileHistoryAt(i - 1).accessed >= FileHistoryAt(i).accessed);
+  for (size_t i = 1; i < list.size(); ++i)
+    Require(FileHistoryAt(i - 1).accessed >= FileHistoryAt(i).accessed);
   if (!SaveFileHistory(HistoryOptionsFromSettings())) return 0;
   (void)LoadFileHistory(HistoryOptionsFromSettings());
   Require(List() == list);

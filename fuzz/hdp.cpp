@@ -6,7 +6,9 @@
 
 // The codec's decoder runs apart, which is this program started again.
 extern "C" int LLVMFuzzerInitialize(int* count, char*** arguments) {
-  if (const auto status = fotomill::platform::ServeApart(*count, *arguments, fotomill::ChildTasks())) std::exit(*status);
+  if (const auto status =
+          fotomill::platform::ServeApart(*count, *arguments, fotomill::ChildTasks()))
+    std::exit(*status);
   return 0;
 }
 

@@ -20,7 +20,8 @@ void Require(bool holds) {
   if (!holds) std::abort();
 }
 
-Entries EntriesOf(std::string_view text, std::string_view section, std::span<const IniEdit> without) {
+Entries EntriesOf(std::string_view text, std::string_view section,
+                  std::span<const IniEdit> without) {
   Entries entries;
   IniReader reader(text, section);
   for (IniEntry entry; reader.Next(entry);) {
@@ -53,7 +54,8 @@ void TryValues(std::string_view text) {
 
 // An edit changes its keys and nothing else, and a second time nothing at all.
 void TryEdits(std::string_view text) {
-  const std::vector<IniEdit> edits{{"JpegCompression", "5"}, {"NewKey", " new "}, {"PrefixCrop", std::nullopt}};
+  const std::vector<IniEdit> edits{
+      {"JpegCompression", "5"}, {"NewKey", " new "}, {"PrefixCrop", std::nullopt}};
   const std::string edited = EditIni(text, "Fotomill", edits);
   Require(FindIniValue(edited, "Fotomill", "JpegCompression") == "5");
   Require(FindIniValue(edited, "Fotomill", "NewKey") == " new ");
@@ -72,7 +74,8 @@ void TryLists(std::string_view text) {
 
   lines.clear();
   const std::vector<RecentFile> files = ParseRecentFiles(text, 100);
-  for (const RecentFile& file : files) lines += file.path + "," + std::to_string(file.number) + "\n";
+  for (const RecentFile& file : files)
+    lines += file.path + "," + std::to_string(file.number) + "\n";
   Require(ParseRecentFiles(lines, 100) == files);
 }
 
@@ -86,7 +89,8 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
   TryEdits(text);
   TryLists(text);
   const BrowserModes modes = ModesInOverride(text, {});
-  Require(modes.thumbnails >= 0 && modes.thumbnails <= 3 && modes.view >= 0 && modes.view <= 4 && modes.sort >= 0);
+  Require(modes.thumbnails >= 0 && modes.thumbnails <= 3 && modes.view >= 0 && modes.view <= 4 &&
+          modes.sort >= 0);
   (void)ParseSpinRange(text);
   return 0;
 }

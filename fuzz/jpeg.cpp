@@ -7,12 +7,14 @@ namespace {
 
 using namespace fotomill;
 
-// A file that could be turned is a sound head of a JPEG file, and its EXIF, whatever it was, can be edited again.
+// A file that could be turned is a sound head of a JPEG file, and its EXIF, whatever it was, can be
+// edited again.
 void TurnFile(std::span<const uint8_t> file) {
   const uint8_t choice = file.empty() ? uint8_t{0} : file.back();
   std::vector<uint8_t> made;
   JpegTurnResult result;
-  const JpegTurnRequest request{.turn = static_cast<Orientation>(1 + choice % 8), .trim = (choice & 8) != 0};
+  const JpegTurnRequest request{.turn = static_cast<Orientation>(1 + choice % 8),
+                                .trim = (choice & 8) != 0};
   if (MakeTurnedJpeg(file, request, made, result) != Status::Ok || made.empty()) return;
   JpegHead head;
   fuzz::Require(ParseJpegHead(made, head) == Status::Ok);

@@ -18,8 +18,8 @@ KeyValues KeysFrom(std::string_view text) {
   return [value](std::string_view) { return value; };
 }
 
-// A recipe is read or its mistakes are named, each in one line of the text; one that was read prints as text that reads and
-// prints the same.
+// A recipe is read or its mistakes are named, each in one line of the text; one that was read
+// prints as text that reads and prints the same.
 void TryRecipe(std::string_view text, const KeyValues& keys) {
   Recipe recipe;
   const std::vector<Mistake> mistakes = ReadRecipe(text, keys, recipe);

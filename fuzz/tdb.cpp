@@ -6,8 +6,8 @@
 #include "platform/files.h"
 #include "support/scratch_file.h"
 
-// The input is a database whose pixels are left out: a header, and 64 bytes for each record: magic, path, volume, flags.
-// What is left behind the last is the beginning of one more.
+// The input is a database whose pixels are left out: a header, and 64 bytes for each record: magic,
+// path, volume, flags. What is left behind the last is the beginning of one more.
 
 namespace fotomill {
 namespace {
@@ -43,8 +43,8 @@ void CompareLookups(ThumbnailDatabase& database, int64_t count) {
     ThumbnailRecord found;
     int64_t first = 0;
     const auto matches = [&] {
-      return database.ReadDatabaseRecord(first, record) && !record.deleted && record.path == wanted.path &&
-             record.volume == wanted.volume;
+      return database.ReadDatabaseRecord(first, record) && !record.deleted &&
+             record.path == wanted.path && record.volume == wanted.volume;
     };
     while (first < count && !matches()) ++first;
     Require(database.Find(wanted.path, wanted.volume, found) == (first < count));
@@ -65,7 +65,8 @@ void TryChanges(ThumbnailDatabase& database, const std::string& path, int64_t co
   DatabaseHeader header;
   if (database.CompactThumbnailDatabase(false) == ThumbnailDatabase::Compacted::Done) {
     Require(database.ReadDatabaseHeader(header) && header.count <= count + added);
-    Require(platform::FactsOf(path).size == kDatabaseHeaderSize + static_cast<uint64_t>(header.count) * kDatabaseRecordSize);
+    Require(platform::FactsOf(path).size ==
+            kDatabaseHeaderSize + static_cast<uint64_t>(header.count) * kDatabaseRecordSize);
     CompareLookups(database, header.count);
   }
 }
@@ -78,7 +79,8 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
   static const std::string path = fuzz::ScratchPath("a") + ".tdb";
   if (size > kDatabaseHeaderSize + 12 * kShortRecord) return 0;
   const std::vector<uint8_t> file = Expand(data, size);
-  Require(platform::WriteWholeFile(path, {reinterpret_cast<const char*>(file.data()), file.size()}));
+  Require(
+      platform::WriteWholeFile(path, {reinterpret_cast<const char*>(file.data()), file.size()}));
   ThumbnailDatabase database;
   DatabaseHeader header;
   if (database.OpenThumbnailDatabase(path, true) != ThumbnailDatabase::Opened::Done) return 0;

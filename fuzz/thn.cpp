@@ -2,7 +2,8 @@
 #include "catalog/thumbnails/thumbnail_file.h"
 #include "support/scratch_file.h"
 
-// A thumbnail file reads as a whole record or not at all, and what reads can be drawn and written back.
+// A thumbnail file reads as a whole record or not at all, and what reads can be drawn and written
+// back.
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
   using namespace fotomill;
   using fuzz::Require;
@@ -14,7 +15,8 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
   record.bytes.fill(7);
   const ThumbnailRecord before = record;
   const bool read = ReadThumbnailFile(record, name);
-  Require(read == (size >= 4 && before.bytes != record.bytes && record.HasMagic(kSmallThumbnailMagic)));
+  Require(read ==
+          (size >= 4 && before.bytes != record.bytes && record.HasMagic(kSmallThumbnailMagic)));
   if (!read) {
     Require(record.bytes == before.bytes);
     return 0;
@@ -25,6 +27,7 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
   const uint32_t flags = data[size / 2] & (size % 64 == 0 ? 0xff : ~kDrawLargeView);
   Require(DrawThumbnailRecord(bitmap, any, static_cast<int8_t>(data[size - 1]), 0, flags, {}));
   ThumbnailRecord again;
-  Require(WriteThumbnailFile(record, path, true) && ReadThumbnailFile(again, path) && again.bytes == record.bytes);
+  Require(WriteThumbnailFile(record, path, true) && ReadThumbnailFile(again, path) &&
+          again.bytes == record.bytes);
   return 0;
 }

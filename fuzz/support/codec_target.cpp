@@ -33,9 +33,11 @@ void TryCodec(const char* extension, const uint8_t* data, size_t size) {
   limits.packedBlockBytes = 4 << 20;
   limits.textScanBytes = 64 << 10;
   const uint32_t options = Hash(data, size);
-  const EncodeOptions encode{.bmpOs2 = (options >> 1 & 1) != 0, .macBinary = (options >> 2 & 1) != 0};
+  const EncodeOptions encode{.bmpOs2 = (options >> 1 & 1) != 0,
+                             .macBinary = (options >> 2 & 1) != 0};
 
-  const ReadRequest request{.fileName = file.Fill(data, size), .options = {.alphaChannels = (options & 1) != 0}};
+  const ReadRequest request{.fileName = file.Fill(data, size),
+                            .options = {.alphaChannels = (options & 1) != 0}};
   const FormatEntry& row = FormatRow(FindFormatByName(std::string("a.") + extension));
   const PicturePointer picture = NewPictureRecord(), described = NewPictureRecord();
   described->fileName.AssignCut(request.fileName);
@@ -50,7 +52,8 @@ void TryCodec(const char* extension, const uint8_t* data, size_t size) {
     if (!picture->image.Empty() || !picture->alpha.Empty()) std::abort();
     return;
   }
-  if (info == Status::Ok && (picture->image.Width() != described->width || picture->image.Height() != described->height)) {
+  if (info == Status::Ok && (picture->image.Width() != described->width ||
+                             picture->image.Height() != described->height)) {
     std::abort();
   }
   if (CanWrite(row)) Write(row.write, *picture, encode);

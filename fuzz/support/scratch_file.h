@@ -12,9 +12,11 @@ namespace fotomill::fuzz {
 // A file in memory that every run fills anew.
 class MemoryFile {
  public:
-  MemoryFile() : handle_(memfd_create("input", 0)), path_("/proc/self/fd/" + std::to_string(handle_)) {}
+  MemoryFile()
+      : handle_(memfd_create("input", 0)), path_("/proc/self/fd/" + std::to_string(handle_)) {}
   const std::string& Fill(const uint8_t* data, size_t size) {
-    if (ftruncate(handle_, 0) != 0 || pwrite(handle_, data, size, 0) != static_cast<ssize_t>(size)) std::abort();
+    if (ftruncate(handle_, 0) != 0 || pwrite(handle_, data, size, 0) != static_cast<ssize_t>(size))
+      std::abort();
     return path_;
   }
 
@@ -23,11 +25,12 @@ class MemoryFile {
   std::string path_;
 };
 
-// A name of this process for files that a target needs on disk. The fuzzer leaves without calling exit handlers: who starts
-// it makes the folder and takes it away again.
+// A name of this process for files that a target needs on disk. The fuzzer leaves without calling
+// exit handlers: who starts it makes the folder and takes it away again.
 inline std::string ScratchPath(const char* name) {
   const char* const folder = std::getenv("TMPDIR");
-  return std::string(folder == nullptr ? "/tmp" : folder) + "/" + name + "-" + std::to_string(getpid());
+  return std::string(folder == nullptr ? "/tmp" : folder) + "/" + name + "-" +
+         std::to_string(getpid());
 }
 
 inline void Require(bool holds) {

@@ -1,15 +1,18 @@
 /*
- * A complete image plug-in: the portable anymap formats PBM, PGM and PPM, plain and raw, with their comment.
+ * A complete image plug-in: the portable anymap formats PBM, PGM and PPM, plain and raw, with their
+ * comment.
  *
  * A file is a text header followed by samples, top row first:
  *
  *   "P1" plain bitmap  "P2" plain graymap  "P3" plain pixmap
  *   "P4" raw bitmap    "P5" raw graymap    "P6" raw pixmap
- *   width and height, then (not for bitmaps) the largest sample value, all in decimal, separated by white space;
- *   "#" starts a comment that ends with its line; one white-space character stands before raw samples.
+ *   width and height, then (not for bitmaps) the largest sample value, all in decimal, separated by
+ * white space;
+ *   "#" starts a comment that ends with its line; one white-space character stands before raw
+ * samples.
  *
- * In bitmaps 1 is black. Samples of more than 8 bits take two bytes, high byte first, and are reduced to 8 here.
- * Source: the netpbm format pages pbm(5), pgm(5) and ppm(5).
+ * In bitmaps 1 is black. Samples of more than 8 bits take two bytes, high byte first, and are
+ * reduced to 8 here. Source: the netpbm format pages pbm(5), pgm(5) and ppm(5).
  */
 #include <stdio.h>
 #include <stdlib.h>
@@ -29,9 +32,12 @@ typedef struct Header {
   size_t commentLength;
 } Header;
 
-static int IsSpace(int c) { return c == ' ' || c == '\t' || c == '\n' || c == '\r' || c == '\v' || c == '\f'; }
+static int IsSpace(int c) {
+  return c == ' ' || c == '\t' || c == '\n' || c == '\r' || c == '\v' || c == '\f';
+}
 
-/* Skips white space and comments; the comments' text is kept while there is room. Returns the next character. */
+/* Skips white space and comments; the comments' text is kept while there is room. Returns the next
+ * character. */
 static int NextCharacter(FILE* file, Header* header) {
   int c = getc(file);
   while (IsSpace(c) || c == '#') {
@@ -39,7 +45,8 @@ static int NextCharacter(FILE* file, Header* header) {
       c = getc(file);
       if (c == ' ') c = getc(file);
       while (c != '\n' && c != EOF) {
-        if (header->commentLength + 2 < COMMENT_SIZE) header->comment[header->commentLength++] = (char)c;
+        if (header->commentLength + 2 < COMMENT_SIZE)
+          header->comment[header->commentLength++] = (char)c;
         c = getc(file);
       }
       if (header->commentLength + 2 < COMMENT_SIZE) header->comment[header->commentLength++] = '\n';
@@ -69,11 +76,15 @@ static int ReadHeader(FILE* file, Header* header) {
   header->kind = getc(file) - '0';
   if (header->kind < 1 || header->kind > 6) return FMW_ERROR_FORMAT;
   header->most = 1;
-  if (!ReadNumber(file, header, &header->width) || !ReadNumber(file, header, &header->height)) return FMW_ERROR_DAMAGED;
-  if (header->kind != 1 && header->kind != 4 && !ReadNumber(file, header, &header->most)) return FMW_ERROR_DAMAGED;
-  if (header->width < 1 || header->height < 1 || header->most < 1 || header->most > 65535) return FMW_ERROR_DAMAGED;
+  if (!ReadNumber(file, header, &header->width) || !ReadNumber(file, header, &header->height))
+    return FMW_ERROR_DAMAGED;
+  if (header->kind != 1 && header->kind != 4 && !ReadNumber(file, header, &header->most))
+    return FMW_ERROR_DAMAGED;
+  if (header->width < 1 || header->height < 1 || header->most < 1 || header->most > 65535)
+    return FMW_ERROR_DAMAGED;
   if ((uint64_t)header->width * header->height > MOST_PIXELS) return FMW_ERROR_MEMORY;
-  while (header->commentLength > 0 && header->comment[header->commentLength - 1] == '\n') --header->commentLength;
+  while (header->commentLength > 0 && header->comment[header->commentLength - 1] == '\n')
+    --header->commentLength;
   header->comment[header->commentLength] = 0;
   return 0;
 }
@@ -83,7 +94,9 @@ static int Bits(const Header* header) {
   return bits[(header->kind - 1) % 3];
 }
 
-static size_t Stride(uint32_t width, int bits) { return ((size_t)width * (size_t)bits + 31) / 32 * 4; }
+static size_t Stride(uint32_t width, int bits) {
+  return ((size_t)width * (size_t)bits + 31) / 32 * 4;
+}
 
 /* One sample, scaled to 0..255 (bitmaps: 0 or 1); -1 at the file's end. */
 static int ReadSample(FILE* file, Header* header) {
@@ -115,7 +128,8 @@ static int ReadRow(FILE* file, Header* header, uint8_t* row) {
   }
   for (x = 0; x < width; ++x) {
     if (Bits(header) == 24) {
-      const int red = ReadSample(file, header), green = ReadSample(file, header), blue = ReadSample(file, header);
+      const int red = ReadSample(file, header), green = ReadSample(file, header),
+                blue = ReadSample(file, header);
       if (red < 0 || green < 0 || blue < 0) return 0;
       row[3 * x] = (uint8_t)blue;
       row[3 * x + 1] = (uint8_t)green;
@@ -138,7 +152,8 @@ static void PutLe(uint8_t* bytes, uint32_t value, int count) {
   for (i = 0; i < count; ++i) bytes[i] = (uint8_t)(value >> (8 * i));
 }
 
-/* A zeroed packed bitmap with its header and gray color table; `rows` receives where the rows begin. */
+/* A zeroed packed bitmap with its header and gray color table; `rows` receives where the rows
+ * begin. */
 static uint8_t* NewBitmap(uint32_t width, uint32_t height, int bits, uint8_t** rows) {
   const uint32_t colors = bits == 24 ? 0 : 1u << bits;
   const size_t rowBytes = Stride(width, bits) * height;
@@ -184,7 +199,8 @@ static void WriteComment(FILE* file, const char* comment) {
   if (!lineStart) putc('\n', file);
 }
 
-/* The kind of file that an extension asks for: 4 bitmap, 5 graymap, 6 pixmap; "pnm" takes what fits the depth. */
+/* The kind of file that an extension asks for: 4 bitmap, 5 graymap, 6 pixmap; "pnm" takes what fits
+ * the depth. */
 static int KindFor(const char* fileName, int bits) {
   const char* dot = strrchr(fileName, '.');
   const char middle = dot != NULL && dot[1] != 0 ? (char)(dot[2] | 0x20) : 'n';
@@ -202,9 +218,12 @@ static const uint8_t* ColorAt(const uint8_t* row, const uint8_t* table, int bits
   return table + 4 * (row[x / 8] >> (7 - x % 8) & 1);
 }
 
-static int GrayOf(const uint8_t* color) { return (color[2] * 299 + color[1] * 587 + color[0] * 114 + 500) / 1000; }
+static int GrayOf(const uint8_t* color) {
+  return (color[2] * 299 + color[1] * 587 + color[0] * 114 + 500) / 1000;
+}
 
-static void WriteRow(FILE* file, const uint8_t* row, const uint8_t* table, int bits, int kind, uint32_t width) {
+static void WriteRow(FILE* file, const uint8_t* row, const uint8_t* table, int bits, int kind,
+                     uint32_t width) {
   uint8_t packed = 0;
   uint32_t x;
   for (x = 0; x < width; ++x) {
@@ -228,7 +247,9 @@ static void WriteRow(FILE* file, const uint8_t* row, const uint8_t* table, int b
 /* ---- exports ---- */
 
 FMW_EXPORT const char* FMW_CALL PLUGIN11GetVersion(void) { return "1.0"; }
-FMW_EXPORT const char* FMW_CALL PLUGIN11GetCopyright(void) { return "A sample of Fotomill Professional"; }
+FMW_EXPORT const char* FMW_CALL PLUGIN11GetCopyright(void) {
+  return "A sample of Fotomill Professional";
+}
 
 FMW_EXPORT int32_t FMW_CALL PLUGIN11GetPluginParams(FMW_PLUGIN_PARAMS* params, int32_t zero) {
   (void)zero;
@@ -241,8 +262,8 @@ FMW_EXPORT int32_t FMW_CALL PLUGIN11GetPluginParams(FMW_PLUGIN_PARAMS* params, i
   return 1;
 }
 
-FMW_EXPORT int32_t FMW_CALL PLUGIN11GetInfo(FMW_PICTURE_INFO* info, const char* fileName, int32_t* error,
-                                            const FMW_HOST_SERVICES* services) {
+FMW_EXPORT int32_t FMW_CALL PLUGIN11GetInfo(FMW_PICTURE_INFO* info, const char* fileName,
+                                            int32_t* error, const FMW_HOST_SERVICES* services) {
   static const char* const names[] = {"Portable bitmap", "Portable graymap", "Portable pixmap"};
   FILE* file;
   Header header;
@@ -254,7 +275,8 @@ FMW_EXPORT int32_t FMW_CALL PLUGIN11GetInfo(FMW_PICTURE_INFO* info, const char* 
   info->width = (int32_t)header.width;
   info->height = (int32_t)header.height;
   info->bitsPerPixel = Bits(&header);
-  for (i = 0; i < 256; ++i) memset(info->palette + 3 * i, info->bitsPerPixel == 1 ? (i == 1 ? 255 : 0) : i, 3);
+  for (i = 0; i < 256; ++i)
+    memset(info->palette + 3 * i, info->bitsPerPixel == 1 ? (i == 1 ? 255 : 0) : i, 3);
   strcpy(info->typeName, names[(header.kind - 1) % 3]);
   return 1;
 }
@@ -272,7 +294,8 @@ FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN11ReadImage(const char* fileName, int32_t* 
   if (block == NULL) *error = FMW_ERROR_MEMORY;
   services->progressBegin();
   for (y = 0; y < header.height && *error == 0; ++y) {
-    if (!ReadRow(file, &header, rows + Stride(header.width, Bits(&header)) * (header.height - 1 - y))) {
+    if (!ReadRow(file, &header,
+                 rows + Stride(header.width, Bits(&header)) * (header.height - 1 - y))) {
       *error = FMW_ERROR_READ;
     }
     services->progressStep((int32_t)y, (int32_t)header.height);
@@ -284,8 +307,9 @@ FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN11ReadImage(const char* fileName, int32_t* 
   return NULL;
 }
 
-FMW_EXPORT int32_t FMW_CALL PLUGIN11WriteImage(const char* fileName, FMW_HANDLE bitmap, const char* comment,
-                                               int32_t* error, const FMW_HOST_SERVICES* services) {
+FMW_EXPORT int32_t FMW_CALL PLUGIN11WriteImage(const char* fileName, FMW_HANDLE bitmap,
+                                               const char* comment, int32_t* error,
+                                               const FMW_HOST_SERVICES* services) {
   const uint8_t* block = bitmap;
   const uint32_t width = Le32(block + 4), height = Le32(block + 8);
   const int bits = block[14];
@@ -317,7 +341,8 @@ FMW_EXPORT int32_t FMW_CALL PLUGIN11WriteImage(const char* fileName, FMW_HANDLE 
   return *error == 0;
 }
 
-FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN11GetComment(const char* fileName, int32_t* error, int32_t zero) {
+FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN11GetComment(const char* fileName, int32_t* error,
+                                                  int32_t zero) {
   FILE* file;
   Header header;
   char* text;

@@ -39,10 +39,15 @@ bool LeadsUp(std::string_view path) {
 
 bool IsFileName(std::string_view name) { return !name.empty() && name != "." && IsPlainName(name); }
 
-// Asks until the name can be taken or nobody wants one. The extension stays the format's, cased after the source's.
-bool AskName(Destination& destination, const std::string& source, std::string_view title, BatchJob& job) {
-  const std::string_view format = destination.extension.empty() ? ExtensionOfFormat(job) : std::string_view(destination.extension);
-  const std::string extension = CasedExtension(format, platform::ExtensionOf(source), job.naming.extensionCase);
+// Asks until the name can be taken or nobody wants one. The extension stays the format's, cased
+// after the source's.
+bool AskName(Destination& destination, const std::string& source, std::string_view title,
+             BatchJob& job) {
+  const std::string_view format = destination.extension.empty()
+                                      ? ExtensionOfFormat(job)
+                                      : std::string_view(destination.extension);
+  const std::string extension =
+      CasedExtension(format, platform::ExtensionOf(source), job.naming.extensionCase);
   NameQuestion question{std::string(title), source, destination.path, extension, {}};
   const platform::PathParts planned = platform::SplitPath(destination.path);
   const std::string folder = std::string(planned.drive).append(planned.folder);
@@ -51,7 +56,8 @@ bool AskName(Destination& destination, const std::string& source, std::string_vi
     if (!typed) return false;
     const platform::PathParts parts = platform::SplitPath(*typed);
     const std::string dotted = "." + extension;
-    const auto whole = CompletedDestination(platform::JoinPath({parts.drive, parts.folder, parts.base, dotted}), folder);
+    const auto whole = CompletedDestination(
+        platform::JoinPath({parts.drive, parts.folder, parts.base, dotted}), folder);
     const bool plain = IsFileName(parts.base) && !LeadsUp(parts.folder);
     if (plain && whole) {
       const platform::PathParts chosen = platform::SplitPath(*whole);
@@ -86,7 +92,8 @@ void StoreChecks(const OverwriteChecks& old, const OverwriteChecks& now, BatchJo
 
 DestinationAnswer KeepBoth(Destination& destination, const VariantMaker& variant) {
   destination.search = variant(destination.path);
-  return destination.search == VariantSearch::Found ? DestinationAnswer::Write : DestinationAnswer::Skip;
+  return destination.search == VariantSearch::Found ? DestinationAnswer::Write
+                                                    : DestinationAnswer::Skip;
 }
 
 // Whether the destination's name is taken; where that cannot be known, the file has no name.
@@ -102,8 +109,10 @@ DestinationAnswer Replace(Destination& destination, const OverwritePolicy& polic
   return DestinationAnswer::Write;
 }
 
-// Shows the overwrite prompt until a name is settled. A typed name that is taken as well is asked about again.
-DestinationAnswer AskAboutCollision(Destination& destination, const std::string& source, BatchJob& job, const TakenTest& taken,
+// Shows the overwrite prompt until a name is settled. A typed name that is taken as well is asked
+// about again.
+DestinationAnswer AskAboutCollision(Destination& destination, const std::string& source,
+                                    BatchJob& job, const TakenTest& taken,
                                     const VariantMaker& variant, const PictureRecord* picture) {
   OverwriteQuestion question{source, {}, {}, {}, picture, {}};
   for (;;) {
@@ -135,19 +144,22 @@ DestinationAnswer AskAboutCollision(Destination& destination, const std::string&
     }
     if (!IsTaken(destination, taken)) return DestinationAnswer::Write;
     if (destination.search != VariantSearch::Found) return DestinationAnswer::Skip;
-    if (!AsksAboutCollisions(job)) return SettleUnasked(destination, job.overwrite, job.applyToRest, variant);
+    if (!AsksAboutCollisions(job))
+      return SettleUnasked(destination, job.overwrite, job.applyToRest, variant);
     question.problem.clear();
   }
 }
 
 }  // namespace
 
-std::string CasedExtension(std::string_view formatExtension, std::string_view sourceExtension, int32_t style) {
+std::string CasedExtension(std::string_view formatExtension, std::string_view sourceExtension,
+                           int32_t style) {
   std::string extension = LowerCase(formatExtension);
   for (size_t i = 0; i < extension.size() && i < sourceExtension.size(); ++i) {
     if (!IsLetter(extension[i]) || !IsLetter(sourceExtension[i])) continue;
     const bool upper =
-        style == choice::kCaseUpper || (style == choice::kCaseOfSource && sourceExtension[i] != LowerCase(sourceExtension[i]));
+        style == choice::kCaseUpper ||
+        (style == choice::kCaseOfSource && sourceExtension[i] != LowerCase(sourceExtension[i]));
     if (upper) extension[i] = UpperCase(extension[i]);
   }
   return extension;
@@ -158,22 +170,32 @@ std::string_view ExtensionOfFormat(const BatchJob& job) {
   return FormatRow(job.formatIndex).extension.view();
 }
 
-std::string PlannedDestination(const std::string& source, std::string_view below, std::string_view prefix, const BatchJob& job) {
+std::string PlannedDestination(const std::string& source, std::string_view below,
+                               std::string_view prefix, const BatchJob& job) {
   const std::string base = std::string(prefix).append(platform::SplitPath(source).base);
-  return PlannedDestination(source, {.extension = ExtensionOfFormat(job), .below = below, .subfolder = {}, .base = base}, job);
+  return PlannedDestination(
+      source, {.extension = ExtensionOfFormat(job), .below = below, .subfolder = {}, .base = base},
+      job);
 }
 
-std::string PlannedDestination(const std::string& source, const OutputPlace& place, const BatchJob& job) {
+std::string PlannedDestination(const std::string& source, const OutputPlace& place,
+                               const BatchJob& job) {
   const platform::PathParts parts = platform::SplitPath(source);
   std::string name(place.base);
   name += '.';
   name += CasedExtension(place.extension, platform::ExtensionOf(source), job.naming.extensionCase);
   const bool beside = job.naming.beside || job.destinationFolder.empty();
-  if (beside && place.subfolder.empty()) return platform::JoinPath({parts.drive, parts.folder, name, {}});
-  std::string folder = beside ? std::string(parts.drive).append(parts.folder) : job.destinationFolder;
+  if (beside && place.subfolder.empty())
+    return platform::JoinPath({parts.drive, parts.folder, name, {}});
+  std::string folder =
+      beside ? std::string(parts.drive).append(parts.folder) : job.destinationFolder;
   for (const std::string_view part : {beside ? std::string_view() : place.below, place.subfolder}) {
-    const bool absolute = part.starts_with(platform::kSeparator) || !platform::SplitPath(part).drive.empty();
-    if (!part.empty()) folder = absolute ? std::string(part) : folder.empty() ? std::string(part) : platform::JoinFolder(folder, part);
+    const bool absolute =
+        part.starts_with(platform::kSeparator) || !platform::SplitPath(part).drive.empty();
+    if (!part.empty())
+      folder = absolute         ? std::string(part)
+               : folder.empty() ? std::string(part)
+                                : platform::JoinFolder(folder, part);
   }
   return platform::JoinFolder(folder, name);
 }
@@ -189,10 +211,12 @@ bool IsDestinationWanted(const BatchJob& job, bool intoFolder) {
   return platform::FileExists(folder) || job.prompts->ConfirmNewFolder(folder);
 }
 
-std::optional<std::string> CompletedDestination(const std::string& destination, std::string_view folder) {
+std::optional<std::string> CompletedDestination(const std::string& destination,
+                                                std::string_view folder) {
   const platform::PathParts parts = platform::SplitPath(destination);
   std::string whole = destination;
-  if (parts.drive.empty() && parts.folder.empty()) whole = platform::JoinFolder(folder, destination);
+  if (parts.drive.empty() && parts.folder.empty())
+    whole = platform::JoinFolder(folder, destination);
   if (!FitsPath(whole)) return std::nullopt;
   return whole;
 }
@@ -207,29 +231,35 @@ void SayNoName(const Destination& destination, FileOutcome& outcome) {
   }
   if (destination.search != VariantSearch::GivenUp) return;
   outcome.status = Status::InvalidDestination;
-  outcome.hint = Tr("%1 numbered variants of \"%2\" exist already.", ThousandsText(kMostVariants), destination.path);
+  outcome.hint = Tr("%1 numbered variants of \"%2\" exist already.", ThousandsText(kMostVariants),
+                    destination.path);
 }
 
 void NoteLostAttributes(FileOutcome& outcome) {
   const std::string lost = platform::TakeLostAttributes();
-  if (outcome.replaced && !lost.empty()) outcome.note.Append(TrRecorded("Not kept from the replaced file: %1.", lost));
+  if (outcome.replaced && !lost.empty())
+    outcome.note.Append(TrRecorded("Not kept from the replaced file: %1.", lost));
 }
 
 bool AsksAboutCollisions(const BatchJob& job) {
   return job.overwrite.prompt && !job.overwrite.skip && !job.applyToRest && job.prompts != nullptr;
 }
 
-// A prompt that is not shown counts as answered with OK; where nobody could have seen it, nothing may be lost.
-DestinationAnswer SettleUnasked(Destination& destination, const OverwritePolicy& policy, bool applyToRest,
-                                const VariantMaker& variant) {
+// A prompt that is not shown counts as answered with OK; where nobody could have seen it, nothing
+// may be lost.
+DestinationAnswer SettleUnasked(Destination& destination, const OverwritePolicy& policy,
+                                bool applyToRest, const VariantMaker& variant) {
   if (policy.skip) return DestinationAnswer::Skip;
   if (!policy.prompt) return Replace(destination, policy);
-  return policy.keepBoth || !applyToRest ? KeepBoth(destination, variant) : Replace(destination, policy);
+  return policy.keepBoth || !applyToRest ? KeepBoth(destination, variant)
+                                         : Replace(destination, policy);
 }
 
-DestinationAnswer MakeDestinationName(Destination& destination, const std::string& source, std::string_view title, BatchJob& job,
-                                      const TakenTest& taken, const VariantMaker& variant, const PictureRecord* picture) {
-  const FormatEntry& row = FormatRow(destination.formatIndex == kNoFormat ? job.formatIndex : destination.formatIndex);
+DestinationAnswer MakeDestinationName(Destination& destination, const std::string& source,
+                                      std::string_view title, BatchJob& job, const TakenTest& taken,
+                                      const VariantMaker& variant, const PictureRecord* picture) {
+  const FormatEntry& row =
+      FormatRow(destination.formatIndex == kNoFormat ? job.formatIndex : destination.formatIndex);
   if ((row.flags & FMT_CLIPBOARD) != 0) {
     destination.path = kClipboardName;
     return DestinationAnswer::Write;
@@ -240,11 +270,14 @@ DestinationAnswer MakeDestinationName(Destination& destination, const std::strin
   destination.taken = IsTaken(destination, taken);
   if (destination.search != VariantSearch::Found) return DestinationAnswer::Skip;
   if (destination.taken) {
-    answer = AsksAboutCollisions(job) ? AskAboutCollision(destination, source, job, taken, variant, picture)
-                                      : SettleUnasked(destination, job.overwrite, job.applyToRest, variant);
+    answer = AsksAboutCollisions(job)
+                 ? AskAboutCollision(destination, source, job, taken, variant, picture)
+                 : SettleUnasked(destination, job.overwrite, job.applyToRest, variant);
   }
-  if (answer == DestinationAnswer::Skip || !job.naming.askPassword || !row.takesPassword) return answer;
-  const auto password = job.prompts != nullptr ? job.prompts->AskPassword(destination.path) : std::nullopt;
+  if (answer == DestinationAnswer::Skip || !job.naming.askPassword || !row.takesPassword)
+    return answer;
+  const auto password =
+      job.prompts != nullptr ? job.prompts->AskPassword(destination.path) : std::nullopt;
   if (!password) return DestinationAnswer::Skip;
   destination.password = *password;
   return answer;

@@ -9,7 +9,8 @@
 
 namespace fotomill {
 
-// What a window does around an external program. Faces implement it; the calls come from the calling thread.
+// What a window does around an external program. Faces implement it; the calls come from the
+// calling thread.
 class ExternalProgramHost {
  public:
   virtual ~ExternalProgramHost() = default;
@@ -24,12 +25,14 @@ class ExternalProgramHost {
 inline constexpr uint32_t kDoNotWait = 0x20000;
 
 // The message when no program is registered for a file, or it cannot be started.
-inline constexpr std::string_view kNoExternalProgram =
-    TrLater("The external player for the file type you selected cannot be found. Please consult the Fotomill Formats document "
-            "for more information about the format in question.");
+inline constexpr std::string_view kNoExternalProgram = TrLater(
+    "The external player for the file type you selected cannot be found. Please consult the "
+    "Fotomill Formats document "
+    "for more information about the format in question.");
 
-// Opens a file with the program that the system has registered for it, and waits until that has ended unless kDoNotWait is
-// set. UnsupportedFunction, after a message, if there is none or it cannot be started.
+// Opens a file with the program that the system has registered for it, and waits until that has
+// ended unless kDoNotWait is set. UnsupportedFunction, after a message, if there is none or it
+// cannot be started.
 Status OpenWithExternalProgram(ExternalProgramHost& host, const std::string& file, uint32_t flags);
 
 }  // namespace fotomill

@@ -37,19 +37,28 @@ struct NamingOptions {
   bool askName = false;       // PromptForDestName
   bool beside = false;        // DestForceSourceDir: every output is beside its source
   bool askPassword = false;   // PasswordProtect
-  bool confirmFormat = true;  // WarnDestinationWrite: the format is asked about before anything is written
+  // WarnDestinationWrite: the format is asked about before anything is written
+  bool confirmFormat = true;
   int32_t firstVariant = 1, lastVariant = INT32_MAX;
-  // What functions put in front of the names of their outputs; blanks belong to it. By number of the function; empty for
-  // those that put nothing there.
+  // What functions put in front of the names of their outputs; blanks belong to it. By number of
+  // the function; empty for those that put nothing there.
   std::array<FixedText<32>, kFileFunctionCount> prefixes = {};
 
   // Empty for functions that put nothing there.
-  std::string_view PrefixOf(FileFunction function) const { return prefixes[static_cast<size_t>(function)].view(); }
+  std::string_view PrefixOf(FileFunction function) const {
+    return prefixes[static_cast<size_t>(function)].view();
+  }
 };
 
-// What holds for later jobs as well once the user has changed it during one: the check boxes of the overwrite prompt, 0 or 1,
-// and the number that the next sequential rename begins with.
-enum class Remembered { PromptBeforeOverwrite, OverwriteKeepBoth, OverwriteRecycle, OverwritePreviews, NextRenameNumber };
+// What holds for later jobs as well once the user has changed it during one: the check boxes of the
+// overwrite prompt, 0 or 1, and the number that the next sequential rename begins with.
+enum class Remembered {
+  PromptBeforeOverwrite,
+  OverwriteKeepBoth,
+  OverwriteRecycle,
+  OverwritePreviews,
+  NextRenameNumber
+};
 
 // How far a sequential rename has counted.
 struct SequentialRenameState {
@@ -58,22 +67,25 @@ struct SequentialRenameState {
   PathText baseName;
 };
 
-// The state of a running function: its request and its results. NewBatchJob creates jobs with the user's settings; a plain job
-// has the built-in defaults, adds no prefixes, and stores nothing. Belongs to the thread that runs the batch.
+// The state of a running function: its request and its results. NewBatchJob creates jobs with the
+// user's settings; a plain job has the built-in defaults, adds no prefixes, and stores nothing.
+// Belongs to the thread that runs the batch.
 struct BatchJob {
-  // Abort: set by the button of the job's own progress box, or by its owner. Functions ask its token between files
-  // and codecs between rows; what is in work is given up or finished, nothing new is begun. Whoever asks the program to end stops every job.
+  // Abort: set by the button of the job's own progress box, or by its owner. Functions ask its
+  // token between files and codecs between rows; what is in work is given up or finished, nothing
+  // new is begun. Whoever asks the program to end stops every job.
   StopSource stop;
   PathText source;                  // the file in work
   int32_t formatIndex = kNoFormat;  // of the outputs
-  std::string extension;            // of the outputs, without dot; empty: the format's own. A plug-in format's has to be
-                                    // kept, as its row may serve another one meanwhile
+  std::string extension;  // of the outputs, without dot; empty: the format's own. A plug-in
+                          // format's has to be kept, as its row may serve another one meanwhile
   std::string destinationFolder;    // empty: beside the source
   ProgressBox* box = nullptr;       // or none; not owned
   Prompts* prompts = nullptr;       // none: no one can be asked; not owned
   bool errors = false;              // a file failed
   bool noSummary = false;           // no closing count line
-  bool applyToRest = false;         // the overwrite prompt is not shown and counts as answered with OK
+  // the overwrite prompt is not shown and counts as answered with OK
+  bool applyToRest = false;
   uint32_t cataloguePage = 0;
   SequentialRenameState rename;
   bool filesChanged = false;  // a file was renamed or written: browsers must refresh
@@ -84,21 +96,25 @@ struct BatchJob {
   EncodeOptions encode;  // of outputs
   ReduceOptions reduction;          // of outputs whose format takes fewer colors
   ProgressSettings boxSettings;
-  uint32_t historyFunctions = ~0u;  // FileHistoryFunctions: a bit for each function whose files are recorded
+  // FileHistoryFunctions: a bit for each function whose files are recorded
+  uint32_t historyFunctions = ~0u;
   bool writeComments = false;       // into files of plug-in formats
   // Keeps a value permanently. Called on the thread that runs the batch; none: nothing is kept.
   std::function<void(Remembered what, int32_t value)> remember = {};
   ProgressModel progress;
   uint32_t writeAborts = 0;   // files left out because no numbered variant was free
-  std::vector<FileUse> uses;  // for the file history, which belongs to the main thread: UpdateFileHistory(job.uses)
+  // for the file history, which belongs to the main thread: UpdateFileHistory(job.uses)
+  std::vector<FileUse> uses;
 };
 
 // What became of one file.
 struct FileOutcome {
   std::string source = {};
-  std::string destination = {};  // Ok: where its output is, or would be in a dry run. Skipped: the file that is in the way
+  // Ok: where its output is, or would be in a dry run. Skipped: the file that is in the way
+  std::string destination = {};
   Status status = Status::Ok;
-  std::string hint = {};  // a sentence that goes behind the message; empty when there is nothing to add
+  // a sentence that goes behind the message; empty when there is nothing to add
+  std::string hint = {};
   bool skipped = false;   // left out by choice or for want of a name; not a failure
   bool replaced = false;  // the output took the place of a file
   std::string output = {};  // which of several outputs of its source, by name

@@ -37,7 +37,8 @@ NamingOptions NamingOptionsFromSettings() {
                        .confirmFormat = settings.WarnDestinationWrite != 0,
                        .firstVariant = settings.NumberedVariantMin,
                        .lastVariant = settings.NumberedVariantMax};
-  for (const auto& [function, key] : kPrefixes) naming.prefixes[static_cast<size_t>(function)] = settings.*key;
+  for (const auto& [function, key] : kPrefixes)
+    naming.prefixes[static_cast<size_t>(function)] = settings.*key;
   return naming;
 }
 
@@ -80,7 +81,9 @@ SequentialRenameRules SequentialRenameRulesFromSettings() {
           .number = static_cast<uint32_t>(std::max(settings.SequentialRenameBaseNumber, 0)),
           .increment = static_cast<uint32_t>(std::max(settings.SequentialRenameIncrement, 1)),
           .maxAttempts = static_cast<uint32_t>(std::max(settings.SequentialRenameMaxAttempts, 1)),
-          .separator = settings.SequentialRenameHyphen != 0 ? std::string(settings.SequentialRenameSep) : std::string(),
+          .separator = settings.SequentialRenameHyphen != 0
+                           ? std::string(settings.SequentialRenameSep)
+                           : std::string(),
           .numberFirst = settings.SequentialRenamePrefix != 0,
           .skipColliding = settings.SequentialRenameSkipCollide != 0,
           .update = settings.SequentialRenameUpdate != 0,

@@ -4,8 +4,10 @@
 
 namespace fotomill {
 
-OutputTarget TargetOf(const std::string& source, const BatchOutput& output, const BatchJob& job, const FallbackFormat& fallback) {
-  if (output.formatIndex != kNoFormat) return {&output, output.formatIndex, output.extension, false, {}};
+OutputTarget TargetOf(const std::string& source, const BatchOutput& output, const BatchJob& job,
+                      const FallbackFormat& fallback) {
+  if (output.formatIndex != kNoFormat)
+    return {&output, output.formatIndex, output.extension, false, {}};
   if (job.formatIndex != kNoFormat) return {&output, job.formatIndex, job.extension, false, {}};
   const int32_t own = FindFormatByName(source);
   const bool kept = own != kNoFormat && own != kSpareRow && CanWrite(FormatRow(own));
@@ -13,8 +15,9 @@ OutputTarget TargetOf(const std::string& source, const BatchOutput& output, cons
   return {&output, fallback.formatIndex, fallback.extension, true, {}};
 }
 
-Status FindQuality(uint64_t most, const std::function<Status(int32_t quality, uint64_t& bytes)>& trial, int32_t& quality,
-                   uint64_t& smallest) {
+Status FindQuality(uint64_t most,
+                   const std::function<Status(int32_t quality, uint64_t& bytes)>& trial,
+                   int32_t& quality, uint64_t& smallest) {
   int32_t fits = 0, tooLarge = 101;
   while (tooLarge - fits > 1) {
     const int32_t middle = (fits + tooLarge) / 2;

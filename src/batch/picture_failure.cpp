@@ -11,9 +11,11 @@ namespace fotomill {
 
 std::string_view LooksLike(const std::string& fileName, int32_t formatIndex) {
   const FileKind kind = IdentifyFile(fileName);
-  const bool asNamed = formatIndex != kNoFormat && kind.IsOf(FormatRow(formatIndex).extension.view());
+  const bool asNamed =
+      formatIndex != kNoFormat && kind.IsOf(FormatRow(formatIndex).extension.view());
   // Targa files have no signature, and the first bytes of many are those of an icon or a cursor.
-  const bool chance = formatIndex != kNoFormat && FormatRow(formatIndex).signatures.empty() && (kind.IsOf("CUR") || kind.IsOf("ICO"));
+  const bool chance = formatIndex != kNoFormat && FormatRow(formatIndex).signatures.empty() &&
+                      (kind.IsOf("CUR") || kind.IsOf("ICO"));
   return asNamed || chance ? std::string_view() : kind.name;
 }
 
@@ -21,8 +23,8 @@ std::string OpenHint(const std::string& fileName, Status status) {
   if (fileName.size() > PathText::Capacity()) return Tr("The path is longer than 260 characters.");
   if (status == Status::FileOpenError) return ReasonSentence();
   if (status == Status::FileReadError && !platform::SystemReason().empty()) return ReasonSentence();
-  if (status != Status::DamagedFile && status != Status::FileReadError && status != Status::UnsupportedFunction &&
-      status != Status::UnsupportedFormat) {
+  if (status != Status::DamagedFile && status != Status::FileReadError &&
+      status != Status::UnsupportedFunction && status != Status::UnsupportedFormat) {
     return {};
   }
   const int32_t index = FindFormatByName(fileName);
@@ -31,7 +33,8 @@ std::string OpenHint(const std::string& fileName, Status status) {
   }
   if (index == kNoFormat) return Tr("Unknown file extension.");
   if (!CanRead(FormatRow(index))) return Tr(WhyNot(FormatRow(index)));
-  return status == Status::UnsupportedFormat ? Tr("This variant of the format cannot be read.") : std::string();
+  return status == Status::UnsupportedFormat ? Tr("This variant of the format cannot be read.")
+                                             : std::string();
 }
 
 }  // namespace fotomill

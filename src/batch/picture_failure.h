@@ -7,11 +7,13 @@
 
 namespace fotomill {
 
-// What a file looks like by its first bytes ("AVIF"), where that is not what its name says; empty otherwise.
+// What a file looks like by its first bytes ("AVIF"), where that is not what its name says; empty
+// otherwise.
 std::string_view LooksLike(const std::string& fileName, int32_t formatIndex);
 
-// What goes behind the message of a file that could not be opened or decoded: what it looks like, what the build lacks,
-// or which format its name should have selected. Empty when there is nothing to add.
+// What goes behind the message of a file that could not be opened or decoded: what it looks like,
+// what the build lacks, or which format its name should have selected. Empty when there is nothing
+// to add.
 std::string OpenHint(const std::string& fileName, Status status);
 
 }  // namespace fotomill

@@ -34,7 +34,8 @@ void ReportFile(BatchJob& job, std::string_view text, uint32_t index, uint32_t c
 
 void ReportOutcome(BatchJob& job, const FileOutcome& outcome, uint32_t index, uint32_t count) {
   if (outcome.status != Status::Ok && !outcome.skipped) job.errors = true;
-  AddLine(job, {FileLine(outcome), {static_cast<int32_t>(index), outcome.status, outcome.skipped}}, &outcome);
+  AddLine(job, {FileLine(outcome), {static_cast<int32_t>(index), outcome.status, outcome.skipped}},
+          &outcome);
   ShowPlace(job, index, count);
 }
 
@@ -47,7 +48,8 @@ void FinishProgress(BatchJob& job) {
   const size_t first = job.progress.Lines().size();
   job.progress.Finish(job.errors, !job.noSummary, job.boxSettings);
   if (job.box == nullptr) return;
-  for (size_t i = first; i < job.progress.Lines().size(); ++i) job.box->ShowLine(job.progress.Lines()[i], nullptr);
+  for (size_t i = first; i < job.progress.Lines().size(); ++i)
+    job.box->ShowLine(job.progress.Lines()[i], nullptr);
   if (job.progress.IsOpen()) {
     job.box->StayOpen(job.progress);
   } else {
@@ -56,7 +58,8 @@ void FinishProgress(BatchJob& job) {
 }
 
 std::string FileLine(const FileOutcome& outcome) {
-  if (outcome.status == Status::Ok && !outcome.skipped) return outcome.source + " -> " + outcome.destination;
+  if (outcome.status == Status::Ok && !outcome.skipped)
+    return outcome.source + " -> " + outcome.destination;
   std::string line = outcome.source + ": ";
   if (!outcome.skipped) line += Tr(StatusMessage(outcome.status));
   if (!outcome.hint.empty()) line += (outcome.skipped ? "" : " ") + outcome.hint;

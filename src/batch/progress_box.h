@@ -11,12 +11,14 @@ namespace fotomill {
 struct BatchJob;
 struct FileOutcome;
 
-// Receives the reports of a batch. Front ends implement it. Every call comes from the thread that runs the batch, which waits for
-// it to return: a window copies what it needs to its own thread. Arguments are valid during the call.
+// Receives the reports of a batch. Front ends implement it. Every call comes from the thread that
+// runs the batch, which waits for it to return: a window copies what it needs to its own thread.
+// Arguments are valid during the call.
 class ProgressBox {
  public:
   virtual ~ProgressBox() = default;
-  // A batch starts; the model is empty. False if there can be no box; the batch is then not started.
+  // A batch starts; the model is empty. False if there can be no box; the batch is then not
+  // started.
   virtual bool Open(const ProgressModel& model) = 0;
   // A new last line of the list; `outcome` is null for lines that are not about a file.
   virtual void ShowLine(const ProgressLine& line, const FileOutcome* outcome) = 0;
@@ -27,23 +29,27 @@ class ProgressBox {
   virtual void Tick() {}
   // False ends the batch as Abort does, for a box that can report no more.
   virtual bool GoesOn() { return true; }
-  // The batch has ended and the box stays open: the list is rebuilt with a vertical scroll bar, every line with
-  // its item and row height, the first visible line as before and the last one selected; Close is live, Abort is not.
+  // The batch has ended and the box stays open: the list is rebuilt with a vertical scroll bar,
+  // every line with its item and row height, the first visible line as before and the last one
+  // selected; Close is live, Abort is not.
   virtual void StayOpen(const ProgressModel& model) = 0;
   // The batch has ended and the box closes.
   virtual void Close(const ProgressModel& model) = 0;
 };
 
-// Opens the job's box, empties its list, and clears the job's error flag. False when the box cannot be
-// shown. A job without a box keeps its lines all the same.
+// Opens the job's box, empties its list, and clears the job's error flag. False when the box cannot
+// be shown. A job without a box keeps its lines all the same.
 bool OpenProgressBox(BatchJob& job);
-// Adds `text` as a new line and sets the status line to "Processing file %d of %d" with index + 1 and count.
+// Adds `text` as a new line and sets the status line to "Processing file %d of %d" with index + 1
+// and count.
 void ReportFile(BatchJob& job, std::string_view text, uint32_t index, uint32_t count);
-// The same with the outcome of the file. The text is FileLine(outcome); a failure sets the job's error flag.
+// The same with the outcome of the file. The text is FileLine(outcome); a failure sets the job's
+// error flag.
 void ReportOutcome(BatchJob& job, const FileOutcome& outcome, uint32_t index, uint32_t count);
 // Sets the job's status line and shows it in its box, if there is one.
 void SetStatus(BatchJob& job, std::string_view text);
-// Adds the closing lines and closes the box or leaves it open for reading, as CloseProgressWhenDone says.
+// Adds the closing lines and closes the box or leaves it open for reading, as CloseProgressWhenDone
+// says.
 void FinishProgress(BatchJob& job);
 
 // A line of the list: "SOURCE -> DESTINATION", or "SOURCE: MESSAGE" followed by the hint.

@@ -36,7 +36,8 @@ void ProgressModel::Finish(bool errors, bool summary, const ProgressSettings& bo
 }
 
 std::string CountLine(uint32_t files) {
-  return files == 0 ? Tr("No files were processed.") : TrCount("One file was processed.", "%1 files were processed.", files);
+  return files == 0 ? Tr("No files were processed.")
+                    : TrCount("One file was processed.", "%1 files were processed.", files);
 }
 
 Rectangle ProgressBoxPlace(int32_t frameWidth, int32_t frameHeight, const ProgressSettings& box) {
@@ -44,16 +45,19 @@ Rectangle ProgressBoxPlace(int32_t frameWidth, int32_t frameHeight, const Progre
   return {(frameWidth - kBoxWidth) / 2, (frameHeight - height) / 2, kBoxWidth, height};
 }
 
-ProgressLayout LayOutProgressBox(int32_t clientWidth, int32_t clientHeight, const ProgressSettings& box) {
+ProgressLayout LayOutProgressBox(int32_t clientWidth, int32_t clientHeight,
+                                 const ProgressSettings& box) {
   const int32_t half = clientWidth / 2;
   const int32_t buttonX = (half - kButtonWidth) / 2, buttonY = clientHeight - kButtonUp;
   ProgressLayout layout;
-  layout.list = {kListMargin, kListMargin, clientWidth - 2 * kListMargin, clientHeight - kBelowList};
+  layout.list = {kListMargin, kListMargin, clientWidth - 2 * kListMargin,
+                 clientHeight - kBelowList};
   layout.status = {kStatusX, clientHeight - kStatusUp, clientWidth - 2 * kStatusX, kStatusHeight};
   layout.abort = {buttonX, buttonY, kButtonWidth, kButtonHeight};
   layout.close = {half + buttonX, buttonY, kButtonWidth, kButtonHeight};
   if (box.optimizeWindow) {
-    layout.kind = box.showMissingThumbnails ? ProgressListKind::FixedRows : ProgressListKind::VariableRows;
+    layout.kind =
+        box.showMissingThumbnails ? ProgressListKind::FixedRows : ProgressListKind::VariableRows;
     if (box.thumbnails && box.showMissingThumbnails) layout.rowHeight = kThumbnailRow;
   }
   return layout;

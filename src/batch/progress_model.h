@@ -15,7 +15,8 @@ namespace fotomill {
 
 // What each line of the list carries beside its text.
 struct ProgressItem {
-  int32_t file = -1;           // place of its file in the selection, from 0; -1: a line about the batch
+  // place of its file in the selection, from 0; -1: a line about the batch
+  int32_t file = -1;
   Status status = Status::Ok;  // of that file
   bool skipped = false;        // the file was left out; no failure
 };
@@ -40,7 +41,8 @@ inline constexpr const char* kProgressTitle = "Progress";
 inline constexpr const char* kProgressBoxClass = "FotomillProfessionalProgressBox";
 
 // Numbers of the box's controls.
-inline constexpr int32_t kProgressCloseId = 1, kProgressAbortId = 3, kProgressListId = 10, kProgressStatusId = 11;
+inline constexpr int32_t kProgressCloseId = 1, kProgressAbortId = 3, kProgressListId = 10,
+                         kProgressStatusId = 11;
 
 // The state of one box from its opening to its end. Belongs to the thread that runs the batch.
 class ProgressModel {
@@ -49,8 +51,9 @@ class ProgressModel {
   void Open();
   void AddLine(ProgressLine line);  // at the end of the list
   void SetStatus(std::string_view text) { status_ = text; }  // the line below the list
-  // Adds the closing lines: "There were errors" where there were, and, with `summary`, how many files were processed; the
-  // last line is selected. Then closes the box, or leaves it open to be read: with a scroll bar, Close live and Abort not.
+  // Adds the closing lines: "There were errors" where there were, and, with `summary`, how many
+  // files were processed; the last line is selected. Then closes the box, or leaves it open to be
+  // read: with a scroll bar, Close live and Abort not.
   void Finish(bool errors, bool summary, const ProgressSettings& box);
   void Close() { open_ = abortLive_ = closeLive_ = false; }  // both buttons go dead with it
 
@@ -95,6 +98,7 @@ struct ProgressLayout {
   int32_t rowHeight = 0;  // of the list's rows; 0: the list's own, which is read back for drawing
 };
 // Lays out the controls for a client size in pixels.
-ProgressLayout LayOutProgressBox(int32_t clientWidth, int32_t clientHeight, const ProgressSettings& box);
+ProgressLayout LayOutProgressBox(int32_t clientWidth, int32_t clientHeight,
+                                 const ProgressSettings& box);
 
 }  // namespace fotomill

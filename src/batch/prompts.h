@@ -12,12 +12,14 @@ namespace fotomill {
 // The texts of the overwrite prompt.
 inline constexpr std::string_view kOverwriteTitle = TrLater("Overwrite File");
 // The question of the prompt.
-inline constexpr std::string_view kOverwriteText =
-    TrLater("Click on OK to overwrite the existing file.\nChange the file name and click on Ok for a new name.\n"
-            "Click on Cancel to skip this file.");
+inline constexpr std::string_view kOverwriteText = TrLater(
+    "Click on OK to overwrite the existing file.\nChange the file name and click on Ok for a new "
+    "name.\n"
+    "Click on Cancel to skip this file.");
 inline constexpr std::string_view kOverwriteHelpPage = "OVERWRITE";  // of the overwrite prompt
 // Check box: later files are asked about as well.
-inline constexpr std::string_view kNotifyText = TrLater("Notify me the next time I'm about to overwrite a file");
+inline constexpr std::string_view kNotifyText =
+    TrLater("Notify me the next time I'm about to overwrite a file");
 inline constexpr std::string_view kNotifyNote =
     TrLater("Note: if you disable this option, it can be re-enabled later in the Setup window.");
 // Check box: write a numbered variant.
@@ -45,8 +47,10 @@ struct OverwriteQuestion {
   std::string path;                        // the output, which exists
   std::string name;                        // its base name, for the File name field
   OverwriteChecks checks;                  // as they stand
-  const PictureRecord* picture = nullptr;  // the new picture, for its preview; null if there is none. Valid during the call
-  std::string problem;                     // why the last answer could not be taken, a sentence; empty at first
+  // the new picture, for its preview; null if there is none. Valid during the call
+  const PictureRecord* picture = nullptr;
+  // why the last answer could not be taken, a sentence; empty at first
+  std::string problem;
 };
 
 // What the user decided about one output whose name is taken.
@@ -66,8 +70,8 @@ struct NameQuestion {
   std::string problem;    // as above
 };
 
-// What a batch asks its user. Faces implement it; every call comes from the thread that called the batch, blocks until
-// there is an answer, and comes in the order of the selection.
+// What a batch asks its user. Faces implement it; every call comes from the thread that called the
+// batch, blocks until there is an answer, and comes in the order of the selection.
 class Prompts {
  public:
   virtual ~Prompts() = default;
@@ -79,7 +83,8 @@ class Prompts {
   virtual std::optional<std::string> AskPassword(const std::string& path) = 0;
   // "Write files to the PNG format?" False ends the batch before it begins.
   virtual bool ConfirmFormat(const std::string& question) = 0;
-  // Whether a destination folder that is not there may be made. False ends the batch before it begins.
+  // Whether a destination folder that is not there may be made. False ends the batch before it
+  // begins.
   virtual bool ConfirmNewFolder(const std::string& folder) = 0;
 };
 

@@ -18,7 +18,9 @@ struct RecipeRun {
   StopToken stop;
 
   MacroFacts FactsOf(const std::string& source) const {
-    return {.fileName = source, .copyrightHolder = copyrightHolder, .modified = platform::FactsOf(source).modified};
+    return {.fileName = source,
+            .copyrightHolder = copyrightHolder,
+            .modified = platform::FactsOf(source).modified};
   }
   Status Apply(PictureRecord& picture, std::span<const Step> steps) const {
     if (steps.empty()) return Status::Ok;
@@ -30,29 +32,36 @@ struct RecipeRun {
 
 bool HasQuality(std::string_view extension) { return extension == "JPG" || extension == "WEBP"; }
 
-std::string ReadFormat(const SaveStep& save, const BatchJob& job, const FormatLookup& lookup, BatchOutput& output) {
+std::string ReadFormat(const SaveStep& save, const BatchJob& job, const FormatLookup& lookup,
+                       BatchOutput& output) {
   // An option of the command line wins over the recipe.
   if (job.formatIndex == kNoFormat && !save.to.empty()) {
-    if (std::string wrong = lookup(save.to, output.formatIndex, output.extension); !wrong.empty()) return wrong;
+    if (std::string wrong = lookup(save.to, output.formatIndex, output.extension); !wrong.empty())
+      return wrong;
   }
   const std::string& format = job.formatIndex != kNoFormat ? job.extension : output.extension;
   const bool lossy = format.empty() || HasQuality(format);
-  if (save.mostBytes > 0 && !lossy) return Tr("max-bytes needs a format with a quality, such as jpg or webp; not %1.", format);
+  if (save.mostBytes > 0 && !lossy)
+    return Tr("max-bytes needs a format with a quality, such as jpg or webp; not %1.", format);
   return {};
 }
 
 }  // namespace
 
 FileFunction FunctionOfFamily(Family family) {
-  constexpr FileFunction kFunctions[] = {FileFunction::Crop,     FileFunction::Transform, FileFunction::Effects, FileFunction::Filter,
-                                         FileFunction::Annotate, FileFunction::Watermark, FileFunction::Matt};
+  constexpr FileFunction kFunctions[] = {
+      FileFunction::Crop,     FileFunction::Transform, FileFunction::Effects, FileFunction::Filter,
+      FileFunction::Annotate, FileFunction::Watermark, FileFunction::Matt};
   return kFunctions[static_cast<size_t>(family)];
 }
 
-std::string SetRecipe(std::shared_ptr<const Recipe> recipe, const std::string& copyrightHolder, const BatchJob& job,
-                      const FormatLookup& lookup, BatchFunction& function) {
-  const auto run = std::make_shared<RecipeRun>(RecipeRun{recipe, copyrightHolder, function.jobs == 1 ? 1u : 0u, job.stop.Token()});
-  function.transform = [run](PictureRecord& picture) { return run->Apply(picture, run->recipe->common); };
+std::string SetRecipe(std::shared_ptr<const Recipe> recipe, const std::string& copyrightHolder,
+                      const BatchJob& job, const FormatLookup& lookup, BatchFunction& function) {
+  const auto run = std::make_shared<RecipeRun>(
+      RecipeRun{recipe, copyrightHolder, function.jobs == 1 ? 1u : 0u, job.stop.Token()});
+  function.transform = [run](PictureRecord& picture) {
+    return run->Apply(picture, run->recipe->common);
+  };
   function.autoOrient = function.autoOrient || recipe->HasSteps();
   for (size_t i = 0; i < recipe->outputs.size(); ++i) {
     const RecipeOutput& wanted = recipe->outputs[i];
@@ -61,15 +70,19 @@ std::string SetRecipe(std::shared_ptr<const Recipe> recipe, const std::string& c
     output.folder = wanted.save.folder;
     output.quality = wanted.save.quality;
     output.mostBytes = wanted.save.mostBytes;
-    output.transform = [run, i](PictureRecord& picture) { return run->Apply(picture, run->recipe->outputs[i].steps); };
+    output.transform = [run, i](PictureRecord& picture) {
+      return run->Apply(picture, run->recipe->outputs[i].steps);
+    };
     if (!wanted.save.name.empty()) {
       output.nameNeedsPicture = !IsKnownEarly(wanted.save.name);
       output.name = [run, i](const std::string& source, const PictureRecord* picture) {
         static const PictureRecord kNone;
-        return ExpandNameMacros(run->recipe->outputs[i].save.name, run->FactsOf(source), picture != nullptr ? *picture : kNone);
+        return ExpandNameMacros(run->recipe->outputs[i].save.name, run->FactsOf(source),
+                                picture != nullptr ? *picture : kNone);
       };
     }
-    if (std::string wrong = ReadFormat(wanted.save, job, lookup, output); !wrong.empty()) return wrong;
+    if (std::string wrong = ReadFormat(wanted.save, job, lookup, output); !wrong.empty())
+      return wrong;
   }
   return {};
 }

@@ -32,11 +32,17 @@ Status ReportedRun::Work(size_t file) {
 void ReportedRun::Deliver(size_t file, Status status) {
   std::vector<FileOutcome> outcomes = std::move(outcomes_[file]);
   if (status != Status::Ok) outcomes = {FileOutcome{.source = files_[file].name, .status = status}};
-  // A file that was given up in the middle left nothing behind; to its reader it is one that was not begun.
-  if (stop_.Asked()) std::erase_if(outcomes, [](const FileOutcome& outcome) { return outcome.status == Status::FunctionCancelled; });
+  // A file that was given up in the middle left nothing behind; to its reader it is one that was
+  // not begun.
+  if (stop_.Asked())
+    std::erase_if(outcomes, [](const FileOutcome& outcome) {
+      return outcome.status == Status::FunctionCancelled;
+    });
   if (outcomes.empty()) return;
   job_.source.AssignCut(outcomes[0].source);
-  const auto isWritten = [&](const FileOutcome& outcome) { return !outcome.destination.empty() && !outcome.skipped && !task_.dryRun; };
+  const auto isWritten = [&](const FileOutcome& outcome) {
+    return !outcome.destination.empty() && !outcome.skipped && !task_.dryRun;
+  };
   if (std::ranges::any_of(outcomes, isWritten)) {
     NoteUse(outcomes[0].source);
     job_.filesChanged = true;

@@ -15,13 +15,15 @@
 
 namespace fotomill {
 
-// How every batch over files runs: each is worked on, on some thread, into an outcome; outcomes are reported on the calling
-// thread in the order of the selection, to the job's box, and what was written goes into the file history.
+// How every batch over files runs: each is worked on, on some thread, into an outcome; outcomes are
+// reported on the calling thread in the order of the selection, to the job's box, and what was
+// written goes into the file history.
 class ReportedRun {
  public:
   // What is done with each file, and how it is recorded.
   struct Task {
-    // On any thread: an outcome for each output of the file. None for a file that was given up by Abort.
+    // On any thread: an outcome for each output of the file. None for a file that was given up by
+    // Abort.
     std::function<std::vector<FileOutcome>(size_t file)> process;
     FileFunction history = FileFunction::Convert;
     bool dryRun = false;
@@ -47,7 +49,8 @@ class ReportedRun {
   BatchJob& job_;
   const Task task_;
   const StopToken stop_;
-  std::vector<std::vector<FileOutcome>> outcomes_;  // of files that are done and not yet reported; none: given up
+  // of files that are done and not yet reported; none: given up
+  std::vector<std::vector<FileOutcome>> outcomes_;
   std::atomic<bool> ended_{false};
   OrderedRun run_;
 };

@@ -33,10 +33,12 @@ constexpr const char* kTooLong = TrLater("The path would be longer than 260 char
 
 // Whether names are settled by more than a look at the folder.
 bool AsksEveryName(const BatchJob& job) {
-  if (job.formatIndex == kNoFormat) return job.prompts != nullptr && (job.naming.askName || job.naming.askPassword);
+  if (job.formatIndex == kNoFormat)
+    return job.prompts != nullptr && (job.naming.askName || job.naming.askPassword);
   const FormatEntry& row = FormatRow(job.formatIndex);
   if ((row.flags & FMT_CLIPBOARD) != 0) return true;
-  return job.prompts != nullptr && (job.naming.askName || (job.naming.askPassword && row.takesPassword));
+  return job.prompts != nullptr &&
+         (job.naming.askName || (job.naming.askPassword && row.takesPassword));
 }
 
 FileOutcome Failure(const BatchFile& file, Status status, std::string hint = {}) {
@@ -49,12 +51,15 @@ class Batch {
       : files_(files),
         function_(function),
         job_(job),
-        prefix_(function.prefix ? *function.prefix : std::string(job.naming.PrefixOf(function.history))),
+        prefix_(function.prefix ? *function.prefix
+                                : std::string(job.naming.PrefixOf(function.history))),
         asksEveryName_(AsksEveryName(job)),
         outputs_(function.outputs),
         needsPicture_(std::ranges::any_of(outputs_, &BatchOutput::nameNeedsPicture)),
         run_(files, job,
-             {.process = [this](size_t i) { return Process(i); }, .history = function.history, .dryRun = function.dryRun}) {
+             {.process = [this](size_t i) { return Process(i); },
+              .history = function.history,
+              .dryRun = function.dryRun}) {
     if (outputs_.empty()) outputs_.emplace_back();
     for (const BatchFile& file : files_) {
       if (file.status != Status::Ok) continue;
@@ -81,14 +86,16 @@ class Batch {
   std::vector<OutputTarget> TargetsOf(const BatchFile& file) const {
     std::vector<OutputTarget> targets;
     for (const BatchOutput& output : outputs_) {
-      OutputTarget& target = targets.emplace_back(TargetOf(file.name, output, job_, function_.fallback));
+      OutputTarget& target =
+          targets.emplace_back(TargetOf(file.name, output, job_, function_.fallback));
       if (!output.nameNeedsPicture) target.path = PathOf(file, target, nullptr);
     }
     return targets;
   }
 
   // Where an output goes; empty when its name comes out empty.
-  std::string PathOf(const BatchFile& file, const OutputTarget& target, const PictureRecord* picture) const {
+  std::string PathOf(const BatchFile& file, const OutputTarget& target,
+                     const PictureRecord* picture) const {
     if (!function_.out.empty()) return function_.out;
     const BatchOutput& output = *target.output;
     std::string base;
@@ -99,18 +106,21 @@ class Batch {
       base = prefix_ + std::string(platform::SplitPath(file.name).base);
       if (!output.label.empty()) base.append("-").append(output.label);
     }
-    const std::string_view below = function_.keepTree ? std::string_view(file.below) : std::string_view();
+    const std::string_view below =
+        function_.keepTree ? std::string_view(file.below) : std::string_view();
     return PlannedDestination(file.name, {target.extension, below, output.folder, base}, job_);
   }
 
-  // On any thread: one file from its source to its outputs. None where it was given up by Abort before it had a name.
+  // On any thread: one file from its source to its outputs. None where it was given up by Abort
+  // before it had a name.
   std::vector<FileOutcome> Process(size_t i) {
     const BatchFile& file = files_[i];
     if (file.status != Status::Ok) return {Failure(file, file.status, file.hint)};
     std::vector<OutputTarget> targets = TargetsOf(file);
     std::vector<std::string> planned;
     for (const OutputTarget& target : targets) planned.push_back(target.path);
-    // Where another file's output may take this source's place, the order of the selection says which comes first.
+    // Where another file's output may take this source's place, the order of the selection says
+    // which comes first.
     if (names_.IsOutputOfOthers(file.name, planned) && !run_.InTurn(i, [] {})) return {};
     std::vector<FileOutcome> outcomes(targets.size());
     std::vector<size_t> open;  // outputs that need the picture
@@ -119,14 +129,16 @@ class Batch {
     }
     if (open.empty()) return outcomes;
     platform::HeldFile held;  // from before it is read, if an output is going to replace it
-    const bool inPlace = std::ranges::any_of(targets, [&](const OutputTarget& target) { return target.path == file.name; });
+    const bool inPlace = std::ranges::any_of(
+        targets, [&](const OutputTarget& target) { return target.path == file.name; });
     if (inPlace && !function_.dryRun && !held.Hold(file.name)) return {NotHeld(file)};
     PicturePointer picture;
     if (const Status status = Load(file.name, picture); status != Status::Ok) {
       return {Failure(file, status, LoadHint(file.name, status, picture.get()))};
     }
     if (function_.transform && !IsOnlyPlanned()) {
-      if (const Status status = function_.transform(*picture); status != Status::Ok) return {Failure(file, status)};
+      if (const Status status = function_.transform(*picture); status != Status::Ok)
+        return {Failure(file, status)};
     }
     for (const size_t k : open) {
       auto outcome = Produce(i, targets[k], picture, k == open.back(), held);
@@ -158,21 +170,24 @@ class Batch {
     return true;
   }
 
-  // Makes one output of a picture that has gone through the function's own work. All but the last one get a copy.
-  std::optional<FileOutcome> Produce(size_t i, const OutputTarget& target, PicturePointer& picture, bool last,
-                                     platform::HeldFile& held) {
+  // Makes one output of a picture that has gone through the function's own work. All but the last
+  // one get a copy.
+  std::optional<FileOutcome> Produce(size_t i, const OutputTarget& target, PicturePointer& picture,
+                                     bool last, platform::HeldFile& held) {
     const BatchFile& file = files_[i];
     PicturePointer copy;
     if (!last && !IsOnlyPlanned()) {
       copy = NewPictureRecord(picture->defaultColour, picture->window, picture->context);
-      const Status status = copy != nullptr ? CopyPicture(*picture, *copy) : Status::MemoryAllocationError;
+      const Status status =
+          copy != nullptr ? CopyPicture(*picture, *copy) : Status::MemoryAllocationError;
       if (status != Status::Ok) return Failure(file, status);
     }
     PictureRecord& own = copy != nullptr ? *copy : *picture;
     // The source may have bound its own plug-in format to the row that the destination's had.
     if (target.formatIndex == kSpareRow) (void)FindPluginFormat("x." + target.extension);
     if (const Status status = Change(own, target); status != Status::Ok) {
-      return Failure(file, status, status == Status::TooManyColors ? function_.reduceHint : std::string());
+      return Failure(file, status,
+                     status == Status::TooManyColors ? function_.reduceHint : std::string());
     }
     Destination destination;
     destination.path = target.output->nameNeedsPicture ? PathOf(file, target, &own) : target.path;
@@ -182,7 +197,9 @@ class Batch {
     return WriteUnderFreeName(i, std::move(destination), own, target, held);
   }
 
-  static FileOutcome NotHeld(const BatchFile& file) { return Failure(file, Status::ErrorCreatingFile, ReasonSentence()); }
+  static FileOutcome NotHeld(const BatchFile& file) {
+    return Failure(file, Status::ErrorCreatingFile, ReasonSentence());
+  }
 
   static FileOutcome Skipped(const BatchFile& file, const Destination& destination) {
     FileOutcome outcome{.source = file.name, .destination = destination.path, .skipped = true};
@@ -198,7 +215,8 @@ class Batch {
       const std::lock_guard lock(mutex_);
       if (!rules_.overwrite.skip) return false;
       if (IsIndependent(source, destination.path)) {
-        return destination.taken = names_.Taken(destination.path, source) == platform::Existence::Yes;
+        return destination.taken =
+                   names_.Taken(destination.path, source) == platform::Existence::Yes;
       }
     }
     (void)run_.InTurn(i, [&] { destination.taken = IsTaken(destination.path, source) == platform::Existence::Yes; });
@@ -218,12 +236,14 @@ class Batch {
     if (picture == nullptr || status != Status::NoImages || function_.page <= picture->pageCount) {
       return OpenHint(name, status);
     }
-    return TrCount("The file has only one page.", "The file has only %1 pages.", static_cast<uint64_t>(picture->pageCount));
+    return TrCount("The file has only one page.", "The file has only %1 pages.",
+                   static_cast<uint64_t>(picture->pageCount));
   }
 
   // The function's own work, then the depth that the format takes.
   Status Change(PictureRecord& picture, const OutputTarget& target) const {
-    if (target.output->transform && !IsOnlyPlanned()) RETURN_IF_BAD(target.output->transform(picture));
+    if (target.output->transform && !IsOnlyPlanned())
+      RETURN_IF_BAD(target.output->transform(picture));
     const auto deepest = static_cast<int32_t>(FormatRow(target.formatIndex).maxBits);
     if (picture.bitsPerPixel <= deepest) return Status::Ok;
     if (!Reduces(target)) return Status::TooManyColors;
@@ -232,17 +252,22 @@ class Batch {
 
   bool Reduces(const OutputTarget& target) const { return function_.reduce || target.kept; }
 
-  // Settles the name and writes, again when someone else has taken the name since it was found free.
-  std::optional<FileOutcome> WriteUnderFreeName(size_t i, const Destination& planned, PictureRecord& picture, const OutputTarget& target,
+  // Settles the name and writes, again when someone else has taken the name since it was found
+  // free.
+  std::optional<FileOutcome> WriteUnderFreeName(size_t i, const Destination& planned,
+                                                PictureRecord& picture, const OutputTarget& target,
                                                 platform::HeldFile& source) {
     std::optional<FileOutcome> outcome;
-    const bool settled = RetryLostRaces([&] { return TryToWrite(i, planned, picture, target, source, outcome); });
+    const bool settled =
+        RetryLostRaces([&] { return TryToWrite(i, planned, picture, target, source, outcome); });
     return settled ? outcome : Failure(files_[i], Status::ErrorCreatingFile, Tr(kWriteAborted));
   }
 
-  // One attempt at that. False when the name was lost; otherwise `outcome` is what came of the file, none if it was given up.
-  bool TryToWrite(size_t i, Destination destination, PictureRecord& picture, const OutputTarget& target,
-                  platform::HeldFile& source, std::optional<FileOutcome>& outcome) {
+  // One attempt at that. False when the name was lost; otherwise `outcome` is what came of the
+  // file, none if it was given up.
+  bool TryToWrite(size_t i, Destination destination, PictureRecord& picture,
+                  const OutputTarget& target, platform::HeldFile& source,
+                  std::optional<FileOutcome>& outcome) {
     const BatchFile& file = files_[i];
     bool cancelled = false;
     if (Settle(i, destination, picture, cancelled) == DestinationAnswer::Skip) {
@@ -270,12 +295,15 @@ class Batch {
     }
     GiveBack(destination.path);
     if (!destination.replace && LostRace(status, destination.path)) return false;
-    outcome = Failure(file, status, hint.empty() ? WriteHint(destination, status, picture, target) : hint);
+    outcome = Failure(file, status,
+                      hint.empty() ? WriteHint(destination, status, picture, target) : hint);
     return true;
   }
 
-  // Holds the file to be replaced. One that goes to the recycle bin is not lost, whoever has changed it.
-  static bool Hold(const Destination& destination, platform::HeldFile& source, platform::HeldFile& held) {
+  // Holds the file to be replaced. One that goes to the recycle bin is not lost, whoever has
+  // changed it.
+  static bool Hold(const Destination& destination, platform::HeldFile& source,
+                   platform::HeldFile& held) {
     if (destination.recycle) source.Release();
     return destination.recycle || source.IsHeldAs(destination.path) || held.Hold(destination.path);
   }
@@ -285,10 +313,12 @@ class Batch {
     names_.Release(path);
   }
 
-  DestinationAnswer Settle(size_t i, Destination& destination, const PictureRecord& picture, bool& cancelled) {
+  DestinationAnswer Settle(size_t i, Destination& destination, const PictureRecord& picture,
+                           bool& cancelled) {
     DestinationAnswer answer = DestinationAnswer::Skip;
     if (SettleAtOnce(files_[i].name, destination, answer)) return answer;
-    const bool done = run_.InTurn(i, [&] { answer = SettleInTurn(files_[i].name, destination, picture, cancelled); });
+    const bool done = run_.InTurn(
+        i, [&] { answer = SettleInTurn(files_[i].name, destination, picture, cancelled); });
     cancelled = cancelled || !done;
     return answer;
   }
@@ -298,9 +328,10 @@ class Batch {
     return function_.out.empty() && names_.ConcernsNobodyElse(source, planned);
   }
 
-  // Settles a name without waiting for the files before, where they cannot matter and nobody has to be asked. False when it
-  // cannot be done; the destination is then unchanged.
-  bool SettleAtOnce(const std::string& source, Destination& destination, DestinationAnswer& answer) {
+  // Settles a name without waiting for the files before, where they cannot matter and nobody has to
+  // be asked. False when it cannot be done; the destination is then unchanged.
+  bool SettleAtOnce(const std::string& source, Destination& destination,
+                    DestinationAnswer& answer) {
     const std::lock_guard lock(mutex_);
     if (asksEveryName_ || !IsIndependent(source, destination.path)) return false;
     Destination settled = destination;
@@ -332,23 +363,25 @@ class Batch {
   }
 
   // As SettleAtOnce, but in turn: all earlier files are finished.
-  DestinationAnswer SettleInTurn(const std::string& source, Destination& destination, const PictureRecord& picture,
-                                 bool& cancelled) {
+  DestinationAnswer SettleInTurn(const std::string& source, Destination& destination,
+                                 const PictureRecord& picture, bool& cancelled) {
     cancelled = job_.stop.Token().Asked();
     if (cancelled) return DestinationAnswer::Skip;
     const TakenTest taken = [&](const std::string& path) { return IsTaken(path, source); };
     const VariantMaker variant = [&](std::string& path) {
       const std::lock_guard lock(mutex_);
-      return MakeVariant(path, [&](const std::string& candidate) { return names_.Taken(candidate, source); });
+      return MakeVariant(
+          path, [&](const std::string& candidate) { return names_.Taken(candidate, source); });
     };
-    DestinationAnswer answer = MakeDestinationName(destination, source, {}, job_, taken, variant, &picture);
+    DestinationAnswer answer =
+        MakeDestinationName(destination, source, {}, job_, taken, variant, &picture);
     const std::lock_guard lock(mutex_);
     // Unless the user said so of this very file, the files of one run never replace each other.
     if (answer == DestinationAnswer::Write && destination.replace && !destination.asked) {
       if (names_.TakenByRun(destination.path, source)) {
         destination.replace = destination.recycle = false;
-        destination.search =
-            MakeVariant(destination.path, [&](const std::string& path) { return names_.Taken(path, source); });
+        destination.search = MakeVariant(
+            destination.path, [&](const std::string& path) { return names_.Taken(path, source); });
       }
       if (destination.search != VariantSearch::Found) answer = DestinationAnswer::Skip;
     }
@@ -363,14 +396,18 @@ class Batch {
   }
 
   VariantSearch MakeVariant(std::string& path, const TakenTest& taken) {
-    return names_.MakeVariant(path, job_.naming.firstVariant, job_.naming.lastVariant, taken, job_.stop.Token());
+    return names_.MakeVariant(path, job_.naming.firstVariant, job_.naming.lastVariant, taken,
+                              job_.stop.Token());
   }
 
   // Codecs may take less than their row says; colors are then reduced further, step by step.
-  Status Write(PictureRecord& picture, const Destination& destination, const OutputTarget& target, std::string& hint) const {
-    const bool beside = (job_.naming.beside || job_.destinationFolder.empty()) && target.output->folder.empty();
+  Status Write(PictureRecord& picture, const Destination& destination, const OutputTarget& target,
+               std::string& hint) const {
+    const bool beside =
+        (job_.naming.beside || job_.destinationFolder.empty()) && target.output->folder.empty();
     const bool there = beside || !function_.out.empty() || destination.elsewhere;
-    if (!there && !platform::MakeFolders(platform::FolderOf(destination.path))) return Status::ErrorCreatingFile;
+    if (!there && !platform::MakeFolders(platform::FolderOf(destination.path)))
+      return Status::ErrorCreatingFile;
     WriteOptions write{.encode = job_.encode};
     write.existing = destination.replace ? platform::Existing::Replace : platform::Existing::Refuse;
     write.keepMetadata = function_.keepMetadata;
@@ -378,7 +415,9 @@ class Batch {
     write.password = destination.password;
     if (target.output->quality > 0) write.encode.SetQuality(target.output->quality);
     if (destination.recycle) {
-      write.makeWay = [&] { return !platform::FileExists(destination.path) || platform::MoveToTrash(destination.path); };
+      write.makeWay = [&] {
+        return !platform::FileExists(destination.path) || platform::MoveToTrash(destination.path);
+      };
     }
     const PathText source = picture.fileName;
     RefreshExif(picture);
@@ -395,7 +434,8 @@ class Batch {
   }
 
   // The best quality whose file is small enough, found by writing temporary files.
-  static Status ChooseQuality(PictureRecord& picture, const OutputTarget& target, WriteOptions& write, std::string& hint) {
+  static Status ChooseQuality(PictureRecord& picture, const OutputTarget& target,
+                              WriteOptions& write, std::string& hint) {
     const PathText source = picture.fileName;
     uint64_t smallest = 0;
     const auto trial = [&](int32_t quality, uint64_t& bytes) {
@@ -413,13 +453,17 @@ class Batch {
     const Status status = FindQuality(target.output->mostBytes, trial, best, smallest);
     if (status == Status::Ok) write.encode.SetQuality(best);
     picture.fileName = source;
-    if (status == Status::UnsuitableImage) hint = Tr("At the lowest quality it has %1 bytes.", ThousandsText(smallest));
+    if (status == Status::UnsuitableImage)
+      hint = Tr("At the lowest quality it has %1 bytes.", ThousandsText(smallest));
     return status;
   }
 
-  FileOutcome Written(const BatchFile& file, const Destination& destination, bool replaces, const PictureRecord& picture) const {
-    if (function_.keepTimes && !function_.dryRun && !platform::CopyTimes(file.name, destination.path)) {
-      FileOutcome outcome = Failure(file, Status::ErrorWritingFile, Tr("The output was written, but its time could not be set."));
+  FileOutcome Written(const BatchFile& file, const Destination& destination, bool replaces,
+                      const PictureRecord& picture) const {
+    if (function_.keepTimes && !function_.dryRun &&
+        !platform::CopyTimes(file.name, destination.path)) {
+      FileOutcome outcome = Failure(file, Status::ErrorWritingFile,
+                                    Tr("The output was written, but its time could not be set."));
       outcome.destination = destination.path;
       return outcome;
     }
@@ -440,17 +484,23 @@ class Batch {
     return TrRecorded("%1 cannot store: %2.", UpperCase(destination.extension), lost.substr(2));
   }
 
-  std::string WriteHint(const Destination& destination, Status status, const PictureRecord& picture, const OutputTarget& target) const {
-    if (status == Status::TooManyColors) return Reduces(target) ? std::string() : function_.reduceHint;
+  std::string WriteHint(const Destination& destination, Status status, const PictureRecord& picture,
+                        const OutputTarget& target) const {
+    if (status == Status::TooManyColors)
+      return Reduces(target) ? std::string() : function_.reduceHint;
     const std::string& path = destination.path;
     const std::string folder = platform::FolderOf(path);
-    if (status == Status::ErrorWritingFile && !platform::SystemReason().empty()) return ReasonSentence();
-    const bool full = status == Status::ErrorWritingFile && platform::FreeSpace(folder) < picture.image.Bytes().size();
+    if (status == Status::ErrorWritingFile && !platform::SystemReason().empty())
+      return ReasonSentence();
+    const bool full = status == Status::ErrorWritingFile &&
+                      platform::FreeSpace(folder) < picture.image.Bytes().size();
     if (full) return Tr("Not enough disk space at the destination.");
     if (status != Status::ErrorCreatingFile) return {};
     if (platform::IsFolder(path)) return Tr("\"%1\" is a folder.", path);
-    if (!folder.empty() && !platform::IsFolder(folder)) return WithReason(Tr("The folder \"%1\" does not exist.", folder));
-    if (destination.recycle && !platform::HasTrash(path)) return Tr("There is no recycle bin for \"%1\".", path);
+    if (!folder.empty() && !platform::IsFolder(folder))
+      return WithReason(Tr("The folder \"%1\" does not exist.", folder));
+    if (destination.recycle && !platform::HasTrash(path))
+      return Tr("There is no recycle bin for \"%1\".", path);
     return WithReason(Tr("\"%1\" cannot be created.", path));
   }
 
@@ -471,7 +521,8 @@ class Batch {
 
 Status RunBatch(std::span<const BatchFile> files, const BatchFunction& function, BatchJob& job) {
   job.extension = ExtensionOfFormat(job);
-  if (!function.dryRun && !IsDestinationWanted(job, function.out.empty())) return Status::FunctionCancelled;
+  if (!function.dryRun && !IsDestinationWanted(job, function.out.empty()))
+    return Status::FunctionCancelled;
   if (!OpenProgressBox(job)) return Status::FunctionCancelled;
   Batch(files, function, job).Run();
   FinishProgress(job);

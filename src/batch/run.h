@@ -15,39 +15,50 @@ namespace fotomill {
 // One file of the selection.
 struct BatchFile {
   std::string name;
-  std::string below;           // subfolder below the chosen folder, "" or "a/b": for outputs that keep the tree
-  Status status = Status::Ok;  // what is known to be wrong with it already; it is reported and not opened
+  // subfolder below the chosen folder, "" or "a/b": for outputs that keep the tree
+  std::string below;
+  // what is known to be wrong with it already; it is reported and not opened
+  Status status = Status::Ok;
   std::string hint;            // what goes behind the message of such a failure
 };
 
 // What a function does to every file of its selection.
 struct BatchFunction {
-  // Changes the decoded picture; empty for plain conversion. Called on several threads at once, with different pictures.
+  // Changes the decoded picture; empty for plain conversion. Called on several threads at once,
+  // with different pictures.
   std::function<Status(PictureRecord& picture)> transform = {};
-  std::vector<BatchOutput> outputs = {};         // each file is decoded once for all of them; none: one, as the job says
-  FallbackFormat fallback = {};                  // for jobs without a format: of sources whose own cannot be written
+  // each file is decoded once for all of them; none: one, as the job says
+  std::vector<BatchOutput> outputs = {};
+  // for jobs without a format: of sources whose own cannot be written
+  FallbackFormat fallback = {};
   FileFunction history = FileFunction::Convert;  // under which the sources go into the file history
-  std::optional<std::string> prefix = {};        // in front of every name: at most 32 characters, a plain name; none: the job's,
-                                                 // but nothing in front of names that an output makes itself
-  std::string out = {};                          // not empty: the whole path of the output of a selection of one
+  std::optional<std::string> prefix =
+      {};  // in front of every name: at most 32 characters, a plain name; none: the job's,
+           // but nothing in front of names that an output makes itself
+  // not empty: the whole path of the output of a selection of one
+  std::string out = {};
   int32_t page = 1;                              // of files with several, from 1
   uint32_t jobs = 0;                             // number of parallel jobs; 0: one per core
-  bool reduce = false;                           // colors of pictures that are too deep for the format are reduced, as
-                                                 // they always are for a format that was kept
+  bool reduce = false;  // colors of pictures that are too deep for the format are reduced, as
+                        // they always are for a format that was kept
   std::string reduceHint = {};                   // follows "Too many colors."
   bool autoOrient = false;                       // pictures are rotated upright by EXIF orientation
   bool keepMetadata = true;                      // EXIF, XMP and color profiles are copied
-  bool keepTimes = false;                        // outputs get the modification times of their sources
-  bool keepTree = false;                         // the folders of the selection are recreated in the destination folder
-  bool dryRun = false;                           // nothing is written; outcomes are those of a run, as far as they can be told
+  // outputs get the modification times of their sources
+  bool keepTimes = false;
+  // the folders of the selection are recreated in the destination folder
+  bool keepTree = false;
+  // nothing is written; outcomes are those of a run, as far as they can be told
+  bool dryRun = false;
 };
 
-// Runs a function over a selection: opens the job's progress box, asks questions, converts, reports every file in selection
-// order, collects entries for the file history, and finishes the box. Decoding, transforming and encoding run on several
-// threads; everything else happens on the calling thread in the order of the selection, so that outputs, names, questions and
-// lines are the same as with one thread; only a name typed into a question may be refused because a later file already has it.
-// After Abort no more files are started, and current files are finished or leave nothing behind. Ok, or FunctionCancelled if
-// the user declined to start.
+// Runs a function over a selection: opens the job's progress box, asks questions, converts, reports
+// every file in selection order, collects entries for the file history, and finishes the box.
+// Decoding, transforming and encoding run on several threads; everything else happens on the
+// calling thread in the order of the selection, so that outputs, names, questions and lines are the
+// same as with one thread; only a name typed into a question may be refused because a later file
+// already has it. After Abort no more files are started, and current files are finished or leave
+// nothing behind. Ok, or FunctionCancelled if the user declined to start.
 Status RunBatch(std::span<const BatchFile> files, const BatchFunction& function, BatchJob& job);
 
 }  // namespace fotomill

@@ -16,7 +16,8 @@ std::string OriginOfVariant(const std::string& path) {
   const platform::PathParts parts = platform::SplitPath(path);
   const size_t bracket = parts.base.rfind(" [");
   if (!parts.base.ends_with(']') || bracket == std::string_view::npos) return {};
-  return platform::JoinPath({parts.drive, parts.folder, parts.base.substr(0, bracket), parts.extension});
+  return platform::JoinPath(
+      {parts.drive, parts.folder, parts.base.substr(0, bracket), parts.extension});
 }
 
 }  // namespace
@@ -40,11 +41,13 @@ bool RunNames::IsExpected(const std::string& path) const {
   return planned_.contains(key) || sources_.contains(key);
 }
 
-bool RunNames::IsOutputOfOthers(const std::string& source, std::span<const std::string> planned) const {
+bool RunNames::IsOutputOfOthers(const std::string& source,
+                                std::span<const std::string> planned) const {
   const std::string own = Key(source);
   const auto found = planned_.find(own);
   if (found == planned_.end()) return false;
-  return found->second > std::ranges::count_if(planned, [&](const std::string& path) { return Key(path) == own; });
+  return found->second >
+         std::ranges::count_if(planned, [&](const std::string& path) { return Key(path) == own; });
 }
 
 bool RunNames::TakenByRun(const std::string& path, const std::string& source) const {
@@ -63,8 +66,8 @@ void RunNames::Release(const std::string& path) {
   ForgetVariants();
 }
 
-VariantSearch RunNames::MakeVariant(std::string& path, int64_t first, int64_t last, const TakenTest& taken,
-                                    const StopToken& stop) {
+VariantSearch RunNames::MakeVariant(std::string& path, int64_t first, int64_t last,
+                                    const TakenTest& taken, const StopToken& stop) {
   int64_t& start = variants_.try_emplace(Key(path), first).first->second;
   int64_t next = start;
   const auto counted = [&](const std::string& variant) {
@@ -77,7 +80,8 @@ VariantSearch RunNames::MakeVariant(std::string& path, int64_t first, int64_t la
 }
 
 std::string RunNames::Key(const std::string& path) const {
-  const bool relative = platform::SplitPath(path).drive.empty() && !path.starts_with(platform::kSeparator);
+  const bool relative =
+      platform::SplitPath(path).drive.empty() && !path.starts_with(platform::kSeparator);
   return platform::AbsolutePath(relative ? platform::JoinFolder(folder_, path) : path);
 }
 

@@ -43,14 +43,16 @@ class RunNames {
   void ForgetVariants() { variants_.clear(); }
 
   // As MakeNumberedVariant; numbers that this run has found taken before are not tried again.
-  VariantSearch MakeVariant(std::string& path, int64_t first, int64_t last, const TakenTest& taken, const StopToken& stop);
+  VariantSearch MakeVariant(std::string& path, int64_t first, int64_t last, const TakenTest& taken,
+                            const StopToken& stop);
 
  private:
   std::string folder_;                                 // what relative paths are relative to
   std::unordered_map<std::string, uint32_t> sources_;  // how often each is there
   std::unordered_map<std::string, uint32_t> planned_;
   std::unordered_set<std::string> given_;
-  std::unordered_map<std::string, int64_t> variants_;  // the number to continue with, by the path without one
+  // the number to continue with, by the path without one
+  std::unordered_map<std::string, int64_t> variants_;
 };
 
 }  // namespace fotomill

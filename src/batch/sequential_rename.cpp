@@ -19,7 +19,8 @@ namespace {
 constexpr double kStoreInterval = 1;  // seconds between two writes of the next number
 constexpr const char* kNotSafe = TrLater("It could not be recorded for --undo.");
 
-// Has the job remember the number that the next run begins with: a few times a second at most, and at the end.
+// Has the job remember the number that the next run begins with: a few times a second at most, and
+// at the end.
 class NextNumber {
  public:
   NextNumber(const BatchJob& job, bool on) : job_(job), on_(on) {}
@@ -38,7 +39,8 @@ class NextNumber {
     if (!set_) return;
     set_ = false;
     stored_ = platform::MonotonicSeconds();
-    job_.remember(Remembered::NextRenameNumber, static_cast<int32_t>(std::min<uint32_t>(number_, INT32_MAX)));
+    job_.remember(Remembered::NextRenameNumber,
+                  static_cast<int32_t>(std::min<uint32_t>(number_, INT32_MAX)));
   }
 
   const BatchJob& job_;
@@ -48,29 +50,37 @@ class NextNumber {
   double stored_ = platform::MonotonicSeconds();
 };
 
-std::string NewBaseName(const BatchJob& job, const SequentialRenameRules& rules, std::string_view oldBase) {
+std::string NewBaseName(const BatchJob& job, const SequentialRenameRules& rules,
+                        std::string_view oldBase) {
   const std::string number = NumberText(job.rename.number, job.rename.digits);
   if (rules.numberFirst) return number + rules.separator + std::string(oldBase);
   return std::string(job.rename.baseName.view()) + rules.separator + number;
 }
 
 std::string RenameHint(const std::string& path, const BatchJob& job) {
-  if (!IsPlainName(job.rename.baseName.view())) return Tr("The base name must be part of a file name, not a path.");
-  if (path.size() > PathText::Capacity()) return Tr("The path would be longer than 260 characters.");
+  if (!IsPlainName(job.rename.baseName.view()))
+    return Tr("The base name must be part of a file name, not a path.");
+  if (path.size() > PathText::Capacity())
+    return Tr("The path would be longer than 260 characters.");
   return {};
 }
 
-// Whether a noted rename has happened and can be taken back. A killed run may have noted one that it did not do, or have taken
-// one back.
-bool HasHappened(const RenamedFile& file) { return platform::FileExists(file.to) || !platform::FileExists(file.from); }
-
-FileUse Use(const std::string& path, bool removed) {
-  return {platform::AbsolutePath(path), FileFunction::MoveAndCopy, kOwnTime, static_cast<int32_t>(platform::Now()), removed};
+// Whether a noted rename has happened and can be taken back. A killed run may have noted one that
+// it did not do, or have taken one back.
+bool HasHappened(const RenamedFile& file) {
+  return platform::FileExists(file.to) || !platform::FileExists(file.from);
 }
 
-FileOutcome RenameOne(const BatchFile& file, const SequentialRenameRules& rules, RenamedFiles& files, BatchJob& job) {
+FileUse Use(const std::string& path, bool removed) {
+  return {platform::AbsolutePath(path), FileFunction::MoveAndCopy, kOwnTime,
+          static_cast<int32_t>(platform::Now()), removed};
+}
+
+FileOutcome RenameOne(const BatchFile& file, const SequentialRenameRules& rules,
+                      RenamedFiles& files, BatchJob& job) {
   FileOutcome outcome{.source = file.name, .status = file.status, .hint = file.hint};
-  if (outcome.status == Status::Ok && (!files.Exists(file.name) || !platform::IsRegularFile(file.name))) {
+  if (outcome.status == Status::Ok &&
+      (!files.Exists(file.name) || !platform::IsRegularFile(file.name))) {
     outcome.status = Status::FileOpenError;
   }
   if (outcome.status != Status::Ok) return outcome;
@@ -97,8 +107,10 @@ bool RenamedFiles::Exists(const std::string& path) const {
 
 platform::CommitResult RenamedFiles::Rename(const std::string& from, const std::string& to) {
   if (!dryRun_) {
-    noted_ = log_ == nullptr || log_->Intend({platform::AbsolutePath(from), platform::AbsolutePath(to)});
-    const platform::CommitResult result = platform::RenameFile(from, to, platform::Existing::Refuse);
+    noted_ =
+        log_ == nullptr || log_->Intend({platform::AbsolutePath(from), platform::AbsolutePath(to)});
+    const platform::CommitResult result =
+        platform::RenameFile(from, to, platform::Existing::Refuse);
     if (log_ != nullptr) log_->Settle(result == platform::CommitResult::Done);
     return result;
   }
@@ -115,15 +127,19 @@ std::string NumberText(uint32_t number, int32_t digits) {
   return text.size() < width ? std::string(width - text.size(), '0') + text : text;
 }
 
-Status RenameSequentially(BatchJob& job, std::string& path, const SequentialRenameRules& rules, RenamedFiles& files) {
+Status RenameSequentially(BatchJob& job, std::string& path, const SequentialRenameRules& rules,
+                          RenamedFiles& files) {
   const std::string old = path;
   const platform::PathParts parts = platform::SplitPath(old);
   for (uint32_t attempt = 1; attempt < rules.maxAttempts; ++attempt) {
-    path = platform::JoinPath({parts.drive, parts.folder, NewBaseName(job, rules, parts.base), parts.extension});
+    path = platform::JoinPath(
+        {parts.drive, parts.folder, NewBaseName(job, rules, parts.base), parts.extension});
     if (!RenameHint(path, job).empty()) return Status::RenameError;
     const bool free = path != old && !files.Exists(path);
-    const platform::CommitResult result = free ? files.Rename(old, path) : platform::CommitResult::Taken;
-    if (UINT32_MAX - job.rename.number < rules.increment && result != platform::CommitResult::Done) return Status::RenameError;
+    const platform::CommitResult result =
+        free ? files.Rename(old, path) : platform::CommitResult::Taken;
+    if (UINT32_MAX - job.rename.number < rules.increment && result != platform::CommitResult::Done)
+      return Status::RenameError;
     job.rename.number += rules.increment;
     if (result == platform::CommitResult::Done) {
       job.uses.push_back(Use(old, true));
@@ -135,7 +151,8 @@ Status RenameSequentially(BatchJob& job, std::string& path, const SequentialRena
       path = old;
       return Status::Ok;
     }
-    if (result == platform::CommitResult::Failed) return Status::RenameError;  // no other number would do better
+    // no other number would do better
+    if (result == platform::CommitResult::Failed) return Status::RenameError;
   }
   return Status::RenameError;
 }
@@ -156,7 +173,8 @@ void RunRename(std::span<const BatchFile> files, const RenameOptions& options, B
   job.rename.baseName.AssignCut(rules.baseName);
   std::vector<size_t> order(files.size());
   std::iota(order.begin(), order.end(), size_t{0});
-  if (rules.random) order = RandomOrder(files.size(), options.seed ? *options.seed : std::random_device()());
+  if (rules.random)
+    order = RandomOrder(files.size(), options.seed ? *options.seed : std::random_device()());
   const bool remembers = rules.update && !options.dryRun && job.remember;
   RenameLog log(remembers ? std::optional(rules.number) : std::nullopt);
   RenamedFiles renamed(options.dryRun, &log);
@@ -183,7 +201,8 @@ bool UndoRename(const std::set<std::string>& only, bool dryRun, BatchJob& job) {
   RenameHistory remaining{.files = {}, .number = log->number};
   std::vector<RenamedFile>& left = remaining.files;
   std::vector<RenamedFile> wanted, failed;
-  for (const RenamedFile& file : log->files) (only.empty() || only.contains(file.to) ? wanted : left).push_back(file);
+  for (const RenamedFile& file : log->files)
+    (only.empty() || only.contains(file.to) ? wanted : left).push_back(file);
   if (!OpenProgressBox(job)) return true;
   RenamedFiles files(dryRun);
   const StopToken stop = job.stop.Token();
@@ -196,7 +215,8 @@ bool UndoRename(const std::set<std::string>& only, bool dryRun, BatchJob& job) {
     if (!files.Exists(file.to)) {
       outcome.status = Status::FileOpenError;
       outcome.hint = Tr("The file does not exist.");
-    } else if (files.Exists(file.from) || files.Rename(file.to, file.from) != platform::CommitResult::Done) {
+    } else if (files.Exists(file.from) ||
+               files.Rename(file.to, file.from) != platform::CommitResult::Done) {
       outcome.status = Status::RenameError;
       outcome.hint = files.Exists(file.from) ? Tr("\"%1\" exists.", file.from) : ReasonSentence();
     } else {
@@ -208,14 +228,16 @@ bool UndoRename(const std::set<std::string>& only, bool dryRun, BatchJob& job) {
     ReportOutcome(job, outcome, done++, count);
   }
   left.insert(left.end(), wanted.begin(), wanted.end());
-  left.insert(left.end(), failed.rbegin(), failed.rend());  // the last one first again, when it is tried again
+  // the last one first again, when it is tried again
+  left.insert(left.end(), failed.rbegin(), failed.rend());
   if (dryRun) {
     job.uses.clear();
   } else if (!log->files.empty() && !WriteRenameLog(remaining)) {
     job.errors = true;
   }
   if (!dryRun && left.empty() && log->number && job.remember) {
-    job.remember(Remembered::NextRenameNumber, static_cast<int32_t>(std::min<uint32_t>(*log->number, INT32_MAX)));
+    job.remember(Remembered::NextRenameNumber,
+                 static_cast<int32_t>(std::min<uint32_t>(*log->number, INT32_MAX)));
   }
   FinishProgress(job);
   return true;

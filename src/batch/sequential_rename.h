@@ -51,10 +51,12 @@ class RenamedFiles {
 // The number as names hold it: `digits` wide, zero-filled.
 std::string NumberText(uint32_t number, int32_t digits);
 
-// Gives `path` the next free number and stores the new path in it. Ok when the file was renamed or, the new name being
-// taken, left unchanged; RenameError when no number was free within the attempts, or when the system does not rename it.
-// A rename sets the job's files-changed flag and goes to job.uses.
-Status RenameSequentially(BatchJob& job, std::string& path, const SequentialRenameRules& rules, RenamedFiles& files);
+// Gives `path` the next free number and stores the new path in it. Ok when the file was renamed or,
+// the new name being taken, left unchanged; RenameError when no number was free within the
+// attempts, or when the system does not rename it. A rename sets the job's files-changed flag and
+// goes to job.uses.
+Status RenameSequentially(BatchJob& job, std::string& path, const SequentialRenameRules& rules,
+                          RenamedFiles& files);
 
 // The order of a random run: places 0 to count - 1, the same for the same seed everywhere.
 std::vector<size_t> RandomOrder(size_t count, uint64_t seed);
@@ -66,12 +68,13 @@ struct RenameOptions {
   bool dryRun = false;
 };
 
-// Renames a selection by the rules of the options: opens the job's progress box, reports every file, finishes the box. What
-// was renamed can be taken back by UndoRename until the next run.
+// Renames a selection by the rules of the options: opens the job's progress box, reports every
+// file, finishes the box. What was renamed can be taken back by UndoRename until the next run.
 void RunRename(std::span<const BatchFile> files, const RenameOptions& options, BatchJob& job);
-// Gives the files of the last run their old names again, the last one first; with `only`, absolute paths, those of them
-// only. What cannot be taken back can be tried again. When all is taken back, the next run counts from where the last one did.
-// Unreadable, or locked by another program: false, nothing was done.
+// Gives the files of the last run their old names again, the last one first; with `only`, absolute
+// paths, those of them only. What cannot be taken back can be tried again. When all is taken back,
+// the next run counts from where the last one did. Unreadable, or locked by another program: false,
+// nothing was done.
 bool UndoRename(const std::set<std::string>& only, bool dryRun, BatchJob& job);
 
 }  // namespace fotomill

@@ -31,13 +31,15 @@ bool LookTheSame(const PictureRecord& a, const PictureRecord& b) {
     return entry[0] << 16 | entry[1] << 8 | entry[2];
   };
   for (int32_t y = 0; y < a.image.Height(); ++y) {
-    if (!a.alpha.Empty() && !std::ranges::equal(a.alpha.Row(y).first(static_cast<size_t>(a.alpha.Width())),
-                                                b.alpha.Row(y).first(static_cast<size_t>(b.alpha.Width())))) {
+    if (!a.alpha.Empty() &&
+        !std::ranges::equal(a.alpha.Row(y).first(static_cast<size_t>(a.alpha.Width())),
+                            b.alpha.Row(y).first(static_cast<size_t>(b.alpha.Width())))) {
       return false;
     }
     if (a.image.Bits() == 24 && b.image.Bits() == 24) {
       const size_t bytes = 3 * static_cast<size_t>(a.image.Width());
-      if (!std::ranges::equal(a.image.Row(y).first(bytes), b.image.Row(y).first(bytes))) return false;
+      if (!std::ranges::equal(a.image.Row(y).first(bytes), b.image.Row(y).first(bytes)))
+        return false;
       continue;
     }
     for (int32_t x = 0; x < a.image.Width(); ++x) {
@@ -49,7 +51,8 @@ bool LookTheSame(const PictureRecord& a, const PictureRecord& b) {
 
 // Why a picture cannot be rewritten unchanged, apart from its pixels; empty if it can.
 std::string Obstacle(const PictureRecord& picture) {
-  if (!CanWrite(FormatRow(picture.formatIndex))) return Tr("Files of this format cannot be written.");
+  if (!CanWrite(FormatRow(picture.formatIndex)))
+    return Tr("Files of this format cannot be written.");
   if (picture.pageCount > 1) return Tr("The file has several pictures; all but one would be lost.");
   if (picture.simplified) return Tr("The file has data that would be lost.");
   if (!picture.warning.empty()) return Tr("The file is damaged, although it can be shown.");
@@ -59,9 +62,13 @@ std::string Obstacle(const PictureRecord& picture) {
 // Turns one file.
 class Turning {
  public:
-  Turning(const std::string& source, const std::string& destination, const TurnRequest& request, const ReadOptions& read,
-          const WriteOptions& options)
-      : source_(source), destination_(destination), request_(request), read_(read), options_(options) {}
+  Turning(const std::string& source, const std::string& destination, const TurnRequest& request,
+          const ReadOptions& read, const WriteOptions& options)
+      : source_(source),
+        destination_(destination),
+        request_(request),
+        read_(read),
+        options_(options) {}
 
   TurnedFile Run() {
     result_.status = Turn();
@@ -75,16 +82,20 @@ class Turning {
   }
 
   Status Turn() {
-    if (source_ == destination_ && !held_.Hold(source_)) return Fail(Status::ErrorCreatingFile, ReasonSentence());
+    if (source_ == destination_ && !held_.Hold(source_))
+      return Fail(Status::ErrorCreatingFile, ReasonSentence());
     stamp_ = source_ == destination_ ? held_.Stamp() : platform::StampOf(source_);
     PicturePointer picture;
-    if (const Status status = LoadPictureInfo({.fileName = source_, .options = read_}, picture); status != Status::Ok) {
+    if (const Status status = LoadPictureInfo({.fileName = source_, .options = read_}, picture);
+        status != Status::Ok) {
       return Fail(status, OpenHint(source_, status));
     }
     const auto time = request_.keepTime ? platform::ModificationTime(source_) : std::nullopt;
     RETURN_IF_BAD(FormatRow(picture->formatIndex).turnsWithoutLoss ? TurnAsJpeg() : TurnDecoded(std::move(picture)));
-    if (!result_.changed || !time || platform::SetModificationTime(destination_, *time)) return Status::Ok;
-    return Fail(Status::ErrorWritingFile, Tr("The file was turned, but its time could not be set."));
+    if (!result_.changed || !time || platform::SetModificationTime(destination_, *time))
+      return Status::Ok;
+    return Fail(Status::ErrorWritingFile,
+                Tr("The file was turned, but its time could not be set."));
   }
 
   Status TurnAsJpeg() {
@@ -92,22 +103,28 @@ class Turning {
     if (!file.Open(source_)) return Fail(Status::FileOpenError, ReasonSentence());
     std::vector<uint8_t> made;
     JpegTurnResult turned;
-    const JpegTurnRequest request{
-        .turn = request_.turn, .seenByExif = request_.seenByExif, .trim = request_.trim, .encode = options_.encode};
-    if (const Status status = MakeTurnedJpeg(file.Bytes(), request, made, turned); status != Status::Ok) {
+    const JpegTurnRequest request{.turn = request_.turn,
+                                  .seenByExif = request_.seenByExif,
+                                  .trim = request_.trim,
+                                  .encode = options_.encode};
+    if (const Status status = MakeTurnedJpeg(file.Bytes(), request, made, turned);
+        status != Status::Ok) {
       return Fail(status, turned.obstacle.shown);
     }
     if (!file.Intact()) return Status::FileReadError;
     if (turned.method == JpegTurnMethod::Trimmed) result_.note = TrRecorded("An edge was cropped.");
     if (!turned.obstacle.empty()) {
       const bool tag = turned.method == JpegTurnMethod::Tag;
-      result_.note = tag ? TrRecorded("Only the EXIF orientation was changed.") : TrRecorded("Left unchanged.");
+      result_.note = tag ? TrRecorded("Only the EXIF orientation was changed.")
+                         : TrRecorded("Left unchanged.");
       result_.note.Append(turned.obstacle);
     }
-    return WriteUnlessThere(turned.method == JpegTurnMethod::Nothing ? file.Bytes() : made, turned.method == JpegTurnMethod::Nothing);
+    return WriteUnlessThere(turned.method == JpegTurnMethod::Nothing ? file.Bytes() : made,
+                            turned.method == JpegTurnMethod::Nothing);
   }
 
-  // The old and the turned picture are there at a time, as are the turned one and what is read back.
+  // The old and the turned picture are there at a time, as are the turned one and what is read
+  // back.
   static Status CheckMemory(const PictureRecord& picture) {
     const uint64_t rows = PackedRowBytes(picture.width, picture.height, picture.bitsPerPixel);
     const bool alpha = (picture.alphaFlags & kHasAlpha) != 0;
@@ -115,12 +132,15 @@ class Turning {
   }
 
   Status TurnDecoded(PicturePointer picture) {
-    if (std::string obstacle = Obstacle(*picture); !obstacle.empty()) return Fail(Status::UnsuitableImage, std::move(obstacle));
+    if (std::string obstacle = Obstacle(*picture); !obstacle.empty())
+      return Fail(Status::UnsuitableImage, std::move(obstacle));
     RETURN_IF_BAD(CheckMemory(*picture));
     RETURN_IF_BAD(ReadPicture({.fileName = source_, .options = read_}, *picture));
-    if (std::string obstacle = Obstacle(*picture); !obstacle.empty()) return Fail(Status::UnsuitableImage, std::move(obstacle));
+    if (std::string obstacle = Obstacle(*picture); !obstacle.empty())
+      return Fail(Status::UnsuitableImage, std::move(obstacle));
     const Orientation told = OrientationOf(*picture);
-    const Orientation turn = Composed(request_.seenByExif ? told : Orientation::Upright, request_.turn);
+    const Orientation turn =
+        Composed(request_.seenByExif ? told : Orientation::Upright, request_.turn);
     if (turn == Orientation::Upright && told == Orientation::Upright) {
       platform::FileView file;
       if (!file.Open(source_)) return Status::FileOpenError;
@@ -144,11 +164,14 @@ class Turning {
     PicturePointer back;
     RETURN_IF_BAD(LoadPicture({.fileName = working.Path(), .options = read_}, back));
     const PictureMetadata& metadata = picture.metadata;
-    const bool kept = metadata.exif.empty() == back->metadata.exif.empty() && metadata.xmp == back->metadata.xmp &&
-                      metadata.icc == back->metadata.icc;
-    if (!LookTheSame(picture, *back)) return Fail(Status::UnsuitableImage, Tr("The format would change the colors."));
-    if (!kept) return Fail(Status::UnsuitableImage, Tr("EXIF, XMP or the color profile would be lost."));
-    if (picture.comment != back->comment) return Fail(Status::UnsuitableImage, Tr("The comment would be lost."));
+    const bool kept = metadata.exif.empty() == back->metadata.exif.empty() &&
+                      metadata.xmp == back->metadata.xmp && metadata.icc == back->metadata.icc;
+    if (!LookTheSame(picture, *back))
+      return Fail(Status::UnsuitableImage, Tr("The format would change the colors."));
+    if (!kept)
+      return Fail(Status::UnsuitableImage, Tr("EXIF, XMP or the color profile would be lost."));
+    if (picture.comment != back->comment)
+      return Fail(Status::UnsuitableImage, Tr("The comment would be lost."));
     platform::FileView file;
     if (!file.Open(working.Path())) return Status::FileOpenError;
     return WriteUnlessThere(file.Bytes(), false);
@@ -158,19 +181,24 @@ class Turning {
   Status WriteUnlessThere(std::span<const uint8_t> bytes, bool same) {
     if (same && source_ == destination_) return Status::Ok;
     ByteWriter out;
-    const bool replaces = source_ != destination_ && options_.existing == platform::Existing::Replace;
-    if (replaces && !held_.Hold(destination_)) return Fail(Status::ErrorCreatingFile, ReasonSentence());
+    const bool replaces =
+        source_ != destination_ && options_.existing == platform::Existing::Replace;
+    if (replaces && !held_.Hold(destination_))
+      return Fail(Status::ErrorCreatingFile, ReasonSentence());
     if (!out.Create(destination_)) {
-      return Fail(Status::ErrorCreatingFile, WithReason(Tr("\"%1\" cannot be created.", destination_)));
+      return Fail(Status::ErrorCreatingFile,
+                  WithReason(Tr("\"%1\" cannot be created.", destination_)));
     }
     out.Bytes(bytes);
     WriteOptions options = options_;
     bool unchanged = true;  // a file that another program changed meanwhile is not replaced
     options.makeWay = [&] {
-      return (!options_.makeWay || options_.makeWay()) && (unchanged = platform::StampOf(source_) == stamp_);
+      return (!options_.makeWay || options_.makeWay()) &&
+             (unchanged = platform::StampOf(source_) == stamp_);
     };
     const Status status = CommitOutput(out, options);
-    if (!unchanged || held_.Changed()) return Fail(Status::FileReadError, Tr("The file was changed by another program."));
+    if (!unchanged || held_.Changed())
+      return Fail(Status::FileReadError, Tr("The file was changed by another program."));
     if (status != Status::Ok) return Fail(status, ReasonSentence());
     result_.changed = true;
     return Status::Ok;
@@ -187,8 +215,9 @@ class Turning {
 
 }  // namespace
 
-TurnedFile TurnPictureFile(const std::string& source, const std::string& destination, const TurnRequest& request,
-                           const ReadOptions& read, const WriteOptions& options) {
+TurnedFile TurnPictureFile(const std::string& source, const std::string& destination,
+                           const TurnRequest& request, const ReadOptions& read,
+                           const WriteOptions& options) {
   return Turning(source, destination, request, read, options).Run();
 }
 

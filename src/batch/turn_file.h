@@ -14,7 +14,8 @@ namespace fotomill {
 struct TurnRequest {
   Orientation turn = Orientation::Upright;  // of the picture as it is seen
   bool seenByExif = true;                   // the EXIF orientation is applied first
-  bool trim = false;                        // JPEG edges that cannot be turned losslessly are cropped
+  // JPEG edges that cannot be turned losslessly are cropped
+  bool trim = false;
   bool keepTime = false;                    // the new file has the time of the old one
 };
 
@@ -26,10 +27,12 @@ struct TurnedFile {
   bool changed = false;   // false: nothing was written, the orientation is already right
 };
 
-// Writes a turned copy of a picture file, or replaces it; `options` say what to do if the destination exists. JPEG pictures are
-// turned losslessly, or only their orientation is changed. Others are decoded, turned and written in their own format, but only if
-// the new file has every pixel unchanged: otherwise UnsuitableImage (13), with a hint. Nothing is written unless Ok.
-TurnedFile TurnPictureFile(const std::string& source, const std::string& destination, const TurnRequest& request,
-                           const ReadOptions& read, const WriteOptions& options);
+// Writes a turned copy of a picture file, or replaces it; `options` say what to do if the
+// destination exists. JPEG pictures are turned losslessly, or only their orientation is changed.
+// Others are decoded, turned and written in their own format, but only if the new file has every
+// pixel unchanged: otherwise UnsuitableImage (13), with a hint. Nothing is written unless Ok.
+TurnedFile TurnPictureFile(const std::string& source, const std::string& destination,
+                           const TurnRequest& request, const ReadOptions& read,
+                           const WriteOptions& options);
 
 }  // namespace fotomill

@@ -58,7 +58,8 @@ class TurnBatch {
     if (file.status != Status::Ok) return Failure(file, file.status, file.hint);
     FileOutcome outcome{.source = file.name, .destination = Planned(file)};
     if (function_.inPlace && platform::FactsOf(file.name).link) {
-      return Failure(file, Status::ErrorCreatingFile, Tr("This is a link; name the file it points to."));
+      return Failure(file, Status::ErrorCreatingFile,
+                     Tr("This is a link; name the file it points to."));
     }
     bool goesOn = true;
     if (names_.ConcernsNobodyElse(file.name, outcome.destination)) {
@@ -79,7 +80,8 @@ class TurnBatch {
       outcome.skipped = names_.TakenByRun(planned, outcome.source);
       if (outcome.skipped) outcome.hint = Tr("listed twice; already turned.");
       outcome.replaced = true;
-    } else if (const platform::Existence taken = names_.Taken(planned, outcome.source); taken == platform::Existence::Yes) {
+    } else if (const platform::Existence taken = names_.Taken(planned, outcome.source);
+               taken == platform::Existence::Yes) {
       SettleTaken(outcome);
     } else if (taken == platform::Existence::Unknown) {
       Destination destination;
@@ -96,7 +98,9 @@ class TurnBatch {
     const bool byRun = names_.TakenByRun(outcome.destination, outcome.source);
     outcome.replaced = !job_.overwrite.prompt && !byRun;
     if (outcome.replaced && !job_.overwrite.skip) return;
-    const TakenTest taken = [&](const std::string& path) { return names_.Taken(path, outcome.source); };
+    const TakenTest taken = [&](const std::string& path) {
+      return names_.Taken(path, outcome.source);
+    };
     outcome.replaced = false;
     outcome.skipped = job_.overwrite.skip;
     if (outcome.skipped) {
@@ -105,8 +109,8 @@ class TurnBatch {
     }
     Destination destination;
     destination.path = outcome.destination;
-    destination.search = names_.MakeVariant(outcome.destination, job_.naming.firstVariant, job_.naming.lastVariant, taken,
-                                            job_.stop.Token());
+    destination.search = names_.MakeVariant(outcome.destination, job_.naming.firstVariant,
+                                            job_.naming.lastVariant, taken, job_.stop.Token());
     if (destination.search != VariantSearch::Found) SayNoName(destination, outcome);
   }
 
@@ -121,17 +125,23 @@ class TurnBatch {
     }
     TurnedFile turned;
     if (!folder.empty() && !platform::MakeFolders(folder)) {
-      turned = {.status = Status::ErrorCreatingFile, .hint = WithReason(Tr("The folder \"%1\" does not exist.", folder))};
+      turned = {.status = Status::ErrorCreatingFile,
+                .hint = WithReason(Tr("The folder \"%1\" does not exist.", folder))};
     } else {
-      turned = TurnPictureFile(outcome.source, outcome.destination, function_.request, job_.read, options);
+      turned = TurnPictureFile(outcome.source, outcome.destination, function_.request, job_.read,
+                               options);
     }
-    if (turned.changed && function_.inPlace && function_.replaced) function_.replaced(outcome.source);
+    if (turned.changed && function_.inPlace && function_.replaced)
+      function_.replaced(outcome.source);
     outcome.status = turned.status;
-    outcome.hint = kept ? turned.hint : std::string(Tr("There is not enough disk space to keep the old file for undo."));
+    outcome.hint =
+        kept ? turned.hint
+             : std::string(Tr("There is not enough disk space to keep the old file for undo."));
     outcome.note = turned.note;
     if (turned.changed) NoteLostAttributes(outcome);
     outcome.skipped = turned.status == Status::Ok && !turned.changed;
-    if (outcome.skipped) outcome.hint = turned.note.empty() ? Tr("already in this orientation.") : turned.note.shown;
+    if (outcome.skipped)
+      outcome.hint = turned.note.empty() ? Tr("already in this orientation.") : turned.note.shown;
     if (turned.status != Status::Ok) outcome.destination.clear();
   }
 

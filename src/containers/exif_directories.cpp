@@ -10,21 +10,28 @@ namespace fotomill {
 
 namespace {
 
-constexpr uint16_t kExifPointer = 0x8769, kGpsPointer = 0x8825, kInteroperabilityPointer = 0xA005, kOrientation = 0x0112;
+constexpr uint16_t kExifPointer = 0x8769, kGpsPointer = 0x8825, kInteroperabilityPointer = 0xA005,
+                   kOrientation = 0x0112;
 constexpr uint16_t kShort = 3, kLong = 4;
 constexpr uint16_t kMostTypes = 13;
-constexpr uint8_t kUnitBytes[kMostTypes + 1] = {0, 1, 1, 2, 4, 4, 1, 1, 2, 4, 4, 4, 8, 4};  // that swap together
+// that swap together
+constexpr uint8_t kUnitBytes[kMostTypes + 1] = {0, 1, 1, 2, 4, 4, 1, 1, 2, 4, 4, 4, 8, 4};
 constexpr uint8_t kValueBytes[kMostTypes + 1] = {0, 1, 1, 2, 4, 8, 1, 1, 2, 4, 8, 4, 8, 4};
 
-// Tags of a first directory that tell of the picture: texts on who, when and with what; orientation; ratings; titles.
-constexpr uint16_t kDescriptive[] = {0x010D, 0x010E, 0x010F, 0x0110, kOrientation, 0x0131, 0x0132, 0x013B, 0x013C,
-                                     0x4746, 0x4749, 0x8298, 0x9C9B, 0x9C9C,       0x9C9D, 0x9C9E, 0x9C9F};
+// Tags of a first directory that tell of the picture: texts on who, when and with what;
+// orientation; ratings; titles.
+constexpr uint16_t kDescriptive[] = {0x010D, 0x010E, 0x010F, 0x0110, kOrientation, 0x0131,
+                                     0x0132, 0x013B, 0x013C, 0x4746, 0x4749,       0x8298,
+                                     0x9C9B, 0x9C9C, 0x9C9D, 0x9C9E, 0x9C9F};
 
-bool IsPointer(uint16_t tag) { return tag == kExifPointer || tag == kGpsPointer || tag == kInteroperabilityPointer; }
+bool IsPointer(uint16_t tag) {
+  return tag == kExifPointer || tag == kGpsPointer || tag == kInteroperabilityPointer;
+}
 
 class DirectoryReader {
  public:
-  DirectoryReader(std::span<const uint8_t> file, const DirectoryForm& form) : file_(file), form_(form) {}
+  DirectoryReader(std::span<const uint8_t> file, const DirectoryForm& form)
+      : file_(file), form_(form) {}
 
   // The entries of the directory at `offset`, and where its pointers lead.
   struct Result {
@@ -36,7 +43,8 @@ class DirectoryReader {
     ByteReader bytes(file_);
     bytes.Seek(offset);
     const uint64_t count = form_.wide ? Wide(bytes) : Short(bytes);
-    for (uint64_t i = 0; offset != 0 && i < count && bytes.Ok() && entriesLeft_ > 0; ++i, --entriesLeft_)
+    for (uint64_t i = 0; offset != 0 && i < count && bytes.Ok() && entriesLeft_ > 0;
+         ++i, --entriesLeft_)
       TakeEntry(bytes, result);
     return result;
   }
@@ -86,7 +94,8 @@ class DirectoryWriter {
   // Writes a directory with its values; where it lies, 0 for an empty one.
   uint32_t Write(ExifDirectory directory) {
     if (directory.empty()) return 0;
-    std::stable_sort(directory.begin(), directory.end(), [](const ExifEntry& a, const ExifEntry& b) { return a.tag < b.tag; });
+    std::stable_sort(directory.begin(), directory.end(),
+                     [](const ExifEntry& a, const ExifEntry& b) { return a.tag < b.tag; });
     const uint32_t start = Position();
     Short(static_cast<uint16_t>(directory.size()));
     uint32_t place = start + static_cast<uint32_t>(2 + 12 * directory.size() + 4);
@@ -115,13 +124,15 @@ class DirectoryWriter {
   ExifEntry Pointer(uint16_t tag, uint32_t offset) const {
     ExifEntry entry{tag, kLong, 1, {}};
     const bool big = bigEndian_ != swapped_;
-    for (int i = 0; i < 4; ++i) entry.value.push_back(static_cast<uint8_t>(offset >> (big ? 24 - 8 * i : 8 * i)));
+    for (int i = 0; i < 4; ++i)
+      entry.value.push_back(static_cast<uint8_t>(offset >> (big ? 24 - 8 * i : 8 * i)));
     return entry;
   }
 
  private:
   void Number(uint32_t value, int count) {
-    for (int i = 0; i < count; ++i) bytes_.push_back(static_cast<uint8_t>(value >> 8 * (bigEndian_ ? count - 1 - i : i)));
+    for (int i = 0; i < count; ++i)
+      bytes_.push_back(static_cast<uint8_t>(value >> 8 * (bigEndian_ ? count - 1 - i : i)));
   }
   void Values(const ExifEntry& entry) {
     const size_t unit = swapped_ ? kUnitBytes[entry.type] : 1;
@@ -136,7 +147,8 @@ class DirectoryWriter {
 };
 
 // EXIF, the directory that it leads to in front, and GPS.
-void WriteSubdirectories(DirectoryWriter& writer, const ExifDirectories& directories, uint32_t& exif, uint32_t& gps) {
+void WriteSubdirectories(DirectoryWriter& writer, const ExifDirectories& directories,
+                         uint32_t& exif, uint32_t& gps) {
   ExifDirectory entries = directories.exif;
   if (const uint32_t place = writer.Write(directories.interoperability); place != 0) {
     entries.push_back(writer.Pointer(kInteroperabilityPointer, place));
@@ -147,13 +159,15 @@ void WriteSubdirectories(DirectoryWriter& writer, const ExifDirectories& directo
 
 }  // namespace
 
-ExifDirectories GatherExif(std::span<const uint8_t> file, const DirectoryForm& form, uint64_t offset) {
+ExifDirectories GatherExif(std::span<const uint8_t> file, const DirectoryForm& form,
+                           uint64_t offset) {
   DirectoryReader reader(file, form);
   ExifDirectories directories;
   directories.bigEndian = form.bigEndian;
   DirectoryReader::Result first = reader.Read(offset), exif = reader.Read(first.exif);
   std::erase_if(first.entries, [](const ExifEntry& entry) {
-    return std::find(std::begin(kDescriptive), std::end(kDescriptive), entry.tag) == std::end(kDescriptive);
+    return std::find(std::begin(kDescriptive), std::end(kDescriptive), entry.tag) ==
+           std::end(kDescriptive);
   });
   directories.first = std::move(first.entries);
   directories.exif = std::move(exif.entries);
@@ -176,9 +190,11 @@ std::vector<uint8_t> MakeExifBlock(const ExifDirectories& directories) {
   std::vector<uint8_t> subdirectories, block;
   // The first directory stands in front: its size tells where the others begin.
   ExifDirectory first = directories.first;
-  const bool hasExif = !directories.exif.empty() || !directories.interoperability.empty(), hasGps = !directories.gps.empty();
+  const bool hasExif = !directories.exif.empty() || !directories.interoperability.empty(),
+             hasGps = !directories.gps.empty();
   uint64_t size = 8 + 2 + 12 * (first.size() + (hasExif ? 1 : 0) + (hasGps ? 1 : 0)) + 4;
-  for (const ExifEntry& entry : first) size += entry.value.size() <= 4 ? 0 : entry.value.size() + entry.value.size() % 2;
+  for (const ExifEntry& entry : first)
+    size += entry.value.size() <= 4 ? 0 : entry.value.size() + entry.value.size() % 2;
   DirectoryWriter behind(subdirectories, static_cast<uint32_t>(size), directories.bigEndian, false);
   uint32_t exif = 0, gps = 0;
   WriteSubdirectories(behind, directories, exif, gps);
@@ -213,14 +229,16 @@ PlacedExif PlaceExif(const ExifDirectories& directories, uint32_t base) {
 uint16_t OrientationOf(const ExifDirectories& directories) {
   for (const ExifEntry& entry : directories.first) {
     if (entry.tag != kOrientation || entry.type != kShort || entry.value.size() < 2) continue;
-    const int value = directories.bigEndian ? entry.value[0] << 8 | entry.value[1] : entry.value[1] << 8 | entry.value[0];
+    const int value = directories.bigEndian ? entry.value[0] << 8 | entry.value[1]
+                                            : entry.value[1] << 8 | entry.value[0];
     return value >= 1 && value <= 8 ? static_cast<uint16_t>(value) : uint16_t{1};
   }
   return 1;
 }
 
 void SetOrientation(ExifDirectories& directories, uint16_t orientation) {
-  std::erase_if(directories.first, [](const ExifEntry& entry) { return entry.tag == kOrientation; });
+  std::erase_if(directories.first,
+                [](const ExifEntry& entry) { return entry.tag == kOrientation; });
   const auto low = static_cast<uint8_t>(orientation);
   directories.first.push_back(
       {kOrientation, kShort, 1, directories.bigEndian ? std::vector<uint8_t>{0, low} : std::vector<uint8_t>{low, 0}});

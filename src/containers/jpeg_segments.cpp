@@ -1,7 +1,8 @@
-// A JPEG file's segments: FF, a marker byte, a length of two bytes that counts itself, data. Any number of FF may be in
-// front of a marker; markers 01 and D0 to D8 have neither length nor data.
+// A JPEG file's segments: FF, a marker byte, a length of two bytes that counts itself, data. Any
+// number of FF may be in front of a marker; markers 01 and D0 to D8 have neither length nor data.
 //
-//   E0 "JFIF\0" version (2 bytes), unit, resolutions across and down (2 bytes each), width and height of a thumbnail (1 byte
+//   E0 "JFIF\0" version (2 bytes), unit, resolutions across and down (2 bytes each), width and
+//   height of a thumbnail (1 byte
 //      each), the thumbnail
 //   E0 "JFXX\0" a thumbnail in another form
 // Source: ITU-T T.81 (1992), annex B; T.871 (2011).
@@ -21,14 +22,22 @@ constexpr std::string_view kJfifHead("JFIF\0", 5), kJfxxHead("JFXX\0", 5), kMpfH
 constexpr size_t kJfifSize = 14, kJfifAcross = 8, kJfifThumbnail = 12;
 
 bool StandsAlone(uint8_t marker) { return marker == 0x01 || (marker >= 0xD0 && marker <= 0xD8); }
-bool IsExif(const JpegSegment& segment) { return segment.marker == kApp1 && segment.Starts(kExifHead); }
-bool IsApplication(uint8_t marker) { return (marker >= kApp0 && marker <= kApp15) || marker == kComment; }
+bool IsExif(const JpegSegment& segment) {
+  return segment.marker == kApp1 && segment.Starts(kExifHead);
+}
+bool IsApplication(uint8_t marker) {
+  return (marker >= kApp0 && marker <= kApp15) || marker == kComment;
+}
 
-void Append(std::vector<uint8_t>& bytes, std::span<const uint8_t> more) { bytes.insert(bytes.end(), more.begin(), more.end()); }
+void Append(std::vector<uint8_t>& bytes, std::span<const uint8_t> more) {
+  bytes.insert(bytes.end(), more.begin(), more.end());
+}
 
-void AppendSegment(std::vector<uint8_t>& bytes, uint8_t marker, std::string_view heading, std::span<const uint8_t> data) {
+void AppendSegment(std::vector<uint8_t>& bytes, uint8_t marker, std::string_view heading,
+                   std::span<const uint8_t> data) {
   const size_t length = 2 + heading.size() + data.size();
-  Append(bytes, std::initializer_list<uint8_t>{0xFF, marker, static_cast<uint8_t>(length >> 8), static_cast<uint8_t>(length)});
+  Append(bytes, std::initializer_list<uint8_t>{0xFF, marker, static_cast<uint8_t>(length >> 8),
+                                               static_cast<uint8_t>(length)});
   bytes.insert(bytes.end(), heading.begin(), heading.end());
   Append(bytes, data);
 }
@@ -36,7 +45,9 @@ void AppendSegment(std::vector<uint8_t>& bytes, uint8_t marker, std::string_view
 // JFIF's segment for pixels that were turned.
 void AppendJfif(std::vector<uint8_t>& bytes, std::span<const uint8_t> data, bool swapSides) {
   std::vector<uint8_t> jfif(data.begin(), data.begin() + kJfifSize);
-  if (swapSides) std::swap_ranges(jfif.begin() + kJfifAcross, jfif.begin() + kJfifAcross + 2, jfif.begin() + kJfifAcross + 2);
+  if (swapSides)
+    std::swap_ranges(jfif.begin() + kJfifAcross, jfif.begin() + kJfifAcross + 2,
+                     jfif.begin() + kJfifAcross + 2);
   jfif[kJfifThumbnail] = jfif[kJfifThumbnail + 1] = 0;
   AppendSegment(bytes, kApp0, {}, jfif);
 }
@@ -51,11 +62,13 @@ class Assembly {
     if (!jfif) AddNew();  // behind JFIF's own, in front of everything else
     if (IsExif(segment) && !parts_.exif.empty() && !exifDone_) {
       Once(exifDone_, kExifHead, parts_.exif);
-    } else if (segment.marker == kApp1 && segment.Starts(kXmpHead) && !parts_.xmp.empty() && !xmpDone_) {
+    } else if (segment.marker == kApp1 && segment.Starts(kXmpHead) && !parts_.xmp.empty() &&
+               !xmpDone_) {
       Once(xmpDone_, kXmpHead, parts_.xmp);
     } else if (!parts_.pixels.empty() && jfif && segment.data.size() >= kJfifSize) {
       AppendJfif(made_, segment.data, parts_.swapSides);
-    } else if (parts_.pixels.empty() || (IsApplication(segment.marker) && !IsOldThumbnail(segment))) {
+    } else if (parts_.pixels.empty() ||
+               (IsApplication(segment.marker) && !IsOldThumbnail(segment))) {
       Append(made_, segment.whole);
     }
   }
@@ -71,7 +84,9 @@ class Assembly {
   }
 
  private:
-  static bool IsOldThumbnail(const JpegSegment& segment) { return segment.marker == kApp0 && segment.Starts(kJfxxHead); }
+  static bool IsOldThumbnail(const JpegSegment& segment) {
+    return segment.marker == kApp0 && segment.Starts(kJfxxHead);
+  }
   // Further segments may hold what has no room in the first; they stay.
   void Once(bool& done, std::string_view heading, std::span<const uint8_t> data) {
     if (!done) AppendSegment(made_, kApp1, heading, data);
@@ -126,7 +141,8 @@ std::span<const uint8_t> JpegHead::Exif() const {
 
 std::span<const uint8_t> JpegHead::Xmp() const {
   for (const JpegSegment& segment : segments) {
-    if (segment.marker == kApp1 && segment.Starts(kXmpHead)) return segment.data.subspan(kXmpHead.size());
+    if (segment.marker == kApp1 && segment.Starts(kXmpHead))
+      return segment.data.subspan(kXmpHead.size());
   }
   return {};
 }
@@ -134,7 +150,8 @@ std::span<const uint8_t> JpegHead::Xmp() const {
 bool JpegHead::HasSplitExif() const { return std::ranges::count_if(segments, IsExif) > 1; }
 
 bool JpegHead::HasMorePictures() const {
-  return std::ranges::any_of(segments, [](const JpegSegment& s) { return s.marker == kApp2 && s.Starts(kMpfHead); });
+  return std::ranges::any_of(
+      segments, [](const JpegSegment& s) { return s.marker == kApp2 && s.Starts(kMpfHead); });
 }
 
 Status ParseJpegHead(std::span<const uint8_t> file, JpegHead& head) {
@@ -149,14 +166,16 @@ Status ParseJpegHead(std::span<const uint8_t> file, JpegHead& head) {
   return walk.Outcome();
 }
 
-Status AssembleJpeg(std::span<const uint8_t> file, const JpegHead& head, const JpegParts& parts, std::vector<uint8_t>& made) {
+Status AssembleJpeg(std::span<const uint8_t> file, const JpegHead& head, const JpegParts& parts,
+                    std::vector<uint8_t>& made) {
   if (parts.exif.size() > kMostExif || parts.xmp.size() > kMostXmp) return Status::UnsuitableImage;
   made.clear();
   made.reserve(file.size() + kMostSegment);
   made.push_back(0xFF);
   made.push_back(kBegin);
   Assembly assembly(parts, made);
-  assembly.ExpectNone(!parts.exif.empty() && head.Exif().empty(), !parts.xmp.empty() && head.Xmp().empty());
+  assembly.ExpectNone(!parts.exif.empty() && head.Exif().empty(),
+                      !parts.xmp.empty() && head.Xmp().empty());
   for (const JpegSegment& segment : head.segments) assembly.Add(segment);
   assembly.AddNew();
   if (parts.pixels.empty()) {

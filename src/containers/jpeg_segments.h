@@ -24,7 +24,8 @@ inline constexpr size_t kMostExif = kMostSegment - 6, kMostXmp = kMostSegment - 
 struct JpegPlace {
   uint8_t marker = 0;
   uint64_t start = 0, data = 0, end = 0;  // fill bytes in front belong to it
-  std::span<const uint8_t> first;         // 12 bytes from `data` on or what there is; until the next segment
+  // 12 bytes from `data` on or what there is; until the next segment
+  std::span<const uint8_t> first;
 };
 
 // Walks the segments of a file up to its first scan.
@@ -66,7 +67,8 @@ struct JpegHead {
   std::span<const uint8_t> Xmp() const;  // empty where the file has none
   // Whether EXIF continues in further segments: then what it points to there must stay where it is.
   bool HasSplitExif() const;
-  // Whether further pictures are behind the first, with an index of their places (CIPA DC-007, "MPF").
+  // Whether further pictures are behind the first, with an index of their places (CIPA DC-007,
+  // "MPF").
   bool HasMorePictures() const;
 };
 // DamagedFile (2) when the file is none, FileReadError (3) when it ends before its first scan.
@@ -74,13 +76,16 @@ Status ParseJpegHead(std::span<const uint8_t> file, JpegHead& head);
 
 // A new file from the application segments and comments of an old one and from other pixels.
 struct JpegParts {
-  std::span<const uint8_t> exif = {}, xmp = {};  // replace those of the old file, or are added; empty: these stay as they are
-  std::span<const uint8_t> pixels = {};          // a JPEG file without such segments; empty: everything else stays as it is
+  // replace those of the old file, or are added; empty: these stay as they are
+  std::span<const uint8_t> exif = {}, xmp = {};
+  // a JPEG file without such segments; empty: everything else stays as it is
+  std::span<const uint8_t> pixels = {};
   std::span<const uint8_t> rest = {};            // bytes behind the end of the picture
   bool swapSides = false;                        // the resolutions change places
 };
-// UnsuitableImage (13) when EXIF or XMP are too long for a segment. With pixels the thumbnails of JFIF, which show the old
-// ones, are left out.
-Status AssembleJpeg(std::span<const uint8_t> file, const JpegHead& head, const JpegParts& parts, std::vector<uint8_t>& made);
+// UnsuitableImage (13) when EXIF or XMP are too long for a segment. With pixels the thumbnails of
+// JFIF, which show the old ones, are left out.
+Status AssembleJpeg(std::span<const uint8_t> file, const JpegHead& head, const JpegParts& parts,
+                    std::vector<uint8_t>& made);
 
 }  // namespace fotomill

@@ -1,4 +1,5 @@
-// RIFF, little-endian: "RIFF", the length of the rest (4 bytes), a form of four letters, then chunks.
+// RIFF, little-endian: "RIFF", the length of the rest (4 bytes), a form of four letters, then
+// chunks.
 //
 //   offset size  field
 //        0    4  name

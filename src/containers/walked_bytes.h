@@ -9,18 +9,20 @@
 
 namespace fotomill {
 
-// What a container is walked in: a file in memory, or one of which only the head is there. Beyond the
-// head, bytes are read where a walk comes by, at limits.walkedPlaces places at most. Owns neither.
+// What a container is walked in: a file in memory, or one of which only the head is there. Beyond
+// the head, bytes are read where a walk comes by, at limits.walkedPlaces places at most. Owns
+// neither.
 class WalkedBytes {
  public:
   WalkedBytes(std::span<const uint8_t> file) : held_(file), size_(file.size()) {}
-  explicit WalkedBytes(const platform::FileView& head) : held_(head.Bytes()), size_(head.FileSize()), file_(&head) {}
+  explicit WalkedBytes(const platform::FileView& head)
+      : held_(head.Bytes()), size_(head.FileSize()), file_(&head) {}
 
   static constexpr uint64_t kMost = 16;
   // Of the whole file, in bytes.
   uint64_t Size() const { return size_; }
-  // The bytes from `offset` on: `count`, at most kMost, or as many as there are. Those that are not in
-  // memory stay until the next call.
+  // The bytes from `offset` on: `count`, at most kMost, or as many as there are. Those that are not
+  // in memory stay until the next call.
   std::span<const uint8_t> At(uint64_t offset, uint64_t count);
   // Whether bytes that the file should have could not be read.
   bool Failed() const { return failed_; }

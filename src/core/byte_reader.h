@@ -8,9 +8,10 @@
 
 namespace fotomill {
 
-// Reads a byte span front to back within its bounds. A read past the end gives 0 (or an empty view), marks the reader as
-// short and leaves it there: later reads give 0 as well. Ask Ok() once per structure, and before any number that was
-// read decides an allocation or a loop. The reader does not own the bytes.
+// Reads a byte span front to back within its bounds. A read past the end gives 0 (or an empty
+// view), marks the reader as short and leaves it there: later reads give 0 as well. Ask Ok() once
+// per structure, and before any number that was read decides an allocation or a loop. The reader
+// does not own the bytes.
 class ByteReader {
  public:
   explicit ByteReader(std::span<const uint8_t> bytes) : bytes_(bytes) {}  // does not own the bytes
@@ -23,7 +24,9 @@ class ByteReader {
   uint64_t Size() const { return bytes_.size(); }  // all bytes, read or not
 
   // Numbers in the byte order of their name; 0 where not all of their bytes are there.
-  uint8_t U8() { return position_ < bytes_.size() ? bytes_[position_++] : static_cast<uint8_t>(Fail()); }
+  uint8_t U8() {
+    return position_ < bytes_.size() ? bytes_[position_++] : static_cast<uint8_t>(Fail());
+  }
   uint16_t Le16() { return static_cast<uint16_t>(Little(2)); }  // little-endian
   uint32_t Le32() { return static_cast<uint32_t>(Little(4)); }
   uint64_t Le64() { return Little(8); }
@@ -31,7 +34,8 @@ class ByteReader {
   uint32_t Be32() { return static_cast<uint32_t>(Big(4)); }
   uint64_t Be64() { return Big(8); }
 
-  // The next `count` bytes as a view into the span; empty, and the reader short, when fewer are left.
+  // The next `count` bytes as a view into the span; empty, and the reader short, when fewer are
+  // left.
   std::span<const uint8_t> Take(uint64_t count) {
     if (count > Left()) {
       Fail();
@@ -42,7 +46,9 @@ class ByteReader {
     return view;
   }
   // The next bytes without consuming them, as many as are left but at most `count`.
-  std::span<const uint8_t> Peek(uint64_t count) const { return bytes_.subspan(position_, count < Left() ? count : Left()); }
+  std::span<const uint8_t> Peek(uint64_t count) const {
+    return bytes_.subspan(position_, count < Left() ? count : Left());
+  }
   void Skip(uint64_t count) { (void)Take(count); }  // beyond the end: fails as a read does
   // Moves to an offset from the start; beyond the end the reader is short.
   void Seek(uint64_t offset) {
@@ -54,7 +60,9 @@ class ByteReader {
   }
   // Consumes `text` when it comes next; otherwise returns false and stays.
   bool Match(std::string_view text) {
-    if (text.size() > Left() || std::memcmp(bytes_.data() + position_, text.data(), text.size()) != 0) return false;
+    if (text.size() > Left() ||
+        std::memcmp(bytes_.data() + position_, text.data(), text.size()) != 0)
+      return false;
     position_ += text.size();
     return true;
   }

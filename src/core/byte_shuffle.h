@@ -1,8 +1,9 @@
 #pragma once
 
-// Sixteen bytes at a time on x86 processors that can pick bytes by a table of indices (SSSE3, in all since 2008).
-// Functions that use it are marked BYTE_SHUFFLE, are between `#ifdef BYTE_SHUFFLE` lines, and run only where
-// CanShuffleBytes() says so; a plain loop beside them does the same work everywhere.
+// Sixteen bytes at a time on x86 processors that can pick bytes by a table of indices (SSSE3, in
+// all since 2008). Functions that use it are marked BYTE_SHUFFLE, are between `#ifdef BYTE_SHUFFLE`
+// lines, and run only where CanShuffleBytes() says so; a plain loop beside them does the same work
+// everywhere.
 #if defined(__x86_64__) || defined(__i386__)
 #include <tmmintrin.h>
 

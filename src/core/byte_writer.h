@@ -12,10 +12,11 @@
 
 namespace fotomill {
 
-// Writes a new file front to back. Everything gathers in one buffer that goes out in whole blocks, each at a multiple
-// of the block's size, which systems take best; larger ones gain nothing, and cost much where the machine is a virtual
-// one whose large pieces of free memory belong to its host. A failed write is remembered; ask Failed() or Commit() once
-// at the end. The file appears under its name only with a successful Commit, and leaves no trace without one.
+// Writes a new file front to back. Everything gathers in one buffer that goes out in whole blocks,
+// each at a multiple of the block's size, which systems take best; larger ones gain nothing, and
+// cost much where the machine is a virtual one whose large pieces of free memory belong to its
+// host. A failed write is remembered; ask Failed() or Commit() once at the end. The file appears
+// under its name only with a successful Commit, and leaves no trace without one.
 class ByteWriter {
  public:
   // False when the file cannot be created there (then status 10).
@@ -31,7 +32,9 @@ class ByteWriter {
   void Be16(uint16_t value) { Big(value, 2); }  // big-endian
   void Be32(uint32_t value) { Big(value, 4); }
   // Its bytes, without a closing zero.
-  void Text(std::string_view text) { Bytes({reinterpret_cast<const uint8_t*>(text.data()), text.size()}); }
+  void Text(std::string_view text) {
+    Bytes({reinterpret_cast<const uint8_t*>(text.data()), text.size()});
+  }
   // Padding.
   void Zeros(uint64_t count) {
     for (; count > 0; --count) U8(0);
@@ -50,8 +53,8 @@ class ByteWriter {
       bytes = bytes.subspan(count);
     }
   }
-  // Buffer space for up to `most` bytes (at most kMostReserved), to be filled by the caller, who then says with Used()
-  // how many of them there are.
+  // Buffer space for up to `most` bytes (at most kMostReserved), to be filled by the caller, who
+  // then says with Used() how many of them there are.
   uint8_t* Reserve(size_t most) {
     while (kBufferSize - used_ < most) FlushBlock();
     return buffer_.Data() + used_;
@@ -61,15 +64,18 @@ class ByteWriter {
 
   // Bytes written so far.
   uint64_t Position() const { return flushed_ + used_; }
-  // These overwrite bytes that are before Position(): what is in the file already is changed there, the rest in the buffer.
+  // These overwrite bytes that are before Position(): what is in the file already is changed there,
+  // the rest in the buffer.
   void Patch(uint64_t offset, std::span<const uint8_t> bytes) {
     if (offset < flushed_) {
-      const auto inFile = bytes.first(static_cast<size_t>(std::min<uint64_t>(bytes.size(), flushed_ - offset)));
+      const auto inFile =
+          bytes.first(static_cast<size_t>(std::min<uint64_t>(bytes.size(), flushed_ - offset)));
       failed_ = !file_.WriteAt(offset, inFile) || failed_;
       bytes = bytes.subspan(inFile.size());
       offset = flushed_;
     }
-    if (!bytes.empty()) std::memcpy(buffer_.Data() + (offset - flushed_), bytes.data(), bytes.size());
+    if (!bytes.empty())
+      std::memcpy(buffer_.Data() + (offset - flushed_), bytes.data(), bytes.size());
   }
   // At an offset that was written before.
   void PatchBe32(uint64_t offset, uint32_t value) {
@@ -79,8 +85,8 @@ class ByteWriter {
   }
   // At an offset that was written before.
   void PatchLe32(uint64_t offset, uint32_t value) {
-    const uint8_t bytes[] = {static_cast<uint8_t>(value), static_cast<uint8_t>(value >> 8), static_cast<uint8_t>(value >> 16),
-                             static_cast<uint8_t>(value >> 24)};
+    const uint8_t bytes[] = {static_cast<uint8_t>(value), static_cast<uint8_t>(value >> 8),
+                             static_cast<uint8_t>(value >> 16), static_cast<uint8_t>(value >> 24)};
     Patch(offset, bytes);
   }
   // Whether any write to the system has failed; what is written after that goes nowhere.
@@ -117,13 +123,15 @@ class ByteWriter {
   }
   void Big(uint32_t value, unsigned count) {
     uint8_t* room = Room(count);
-    for (unsigned i = 0; i < count; ++i) room[i] = static_cast<uint8_t>(value >> (8 * (count - 1 - i)));
+    for (unsigned i = 0; i < count; ++i)
+      room[i] = static_cast<uint8_t>(value >> (8 * (count - 1 - i)));
   }
   void Write(std::span<const uint8_t> bytes) {
     failed_ = !file_.Write(bytes) || failed_;
     flushed_ += bytes.size();
   }
-  // Writes the first block of the buffer, which holds at least one, and moves what is left to its beginning.
+  // Writes the first block of the buffer, which holds at least one, and moves what is left to its
+  // beginning.
   void FlushBlock() {
     Write({buffer_.Data(), kBlock});
     used_ -= kBlock;

@@ -5,7 +5,8 @@
 
 namespace fotomill {
 
-// Arithmetic on numbers that a file claims: false when the result does not fit, and then `result` is unspecified.
+// Arithmetic on numbers that a file claims: false when the result does not fit, and then `result`
+// is unspecified.
 template <std::integral T>
 [[nodiscard]] constexpr bool CheckedAdd(T a, T b, T& result) {
   return !__builtin_add_overflow(a, b, &result);

@@ -33,7 +33,9 @@ const std::string& DataFolder() {
   return *chosen;
 }
 
-void SetDataFolder(const std::string& folder) { Chosen() = folder.empty() ? DefaultFolder() : platform::AbsolutePath(folder); }
+void SetDataFolder(const std::string& folder) {
+  Chosen() = folder.empty() ? DefaultFolder() : platform::AbsolutePath(folder);
+}
 
 std::string DataFile(std::string_view name) {
   if (DataFolder().empty()) return {};

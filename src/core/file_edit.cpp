@@ -10,15 +10,16 @@ namespace fotomill {
 
 namespace {
 
-// Holds the lock file of a path, creates it before and removes it afterwards. Who waited may find that the file he
-// locked was removed meanwhile; then he begins again.
+// Holds the lock file of a path, creates it before and removes it afterwards. Who waited may find
+// that the file he locked was removed meanwhile; then he begins again.
 class PathLock {
  public:
   explicit PathLock(const std::string& path) : path_(path + ".lock") {
     using platform::StoreFile;
     for (int tries = 0; tries < kMostTries && !held_; ++tries) {
       StoreFile::OpenResult opened = file_.Open(path_, StoreFile::Mode::ReadWrite);
-      if (opened == StoreFile::OpenResult::Missing) opened = file_.Open(path_, StoreFile::Mode::CreateNew);
+      if (opened == StoreFile::OpenResult::Missing)
+        opened = file_.Open(path_, StoreFile::Mode::CreateNew);
       if (opened == StoreFile::OpenResult::Exists) continue;  // another process was faster
       if (opened != StoreFile::OpenResult::Done || !file_.Lock()) return;
       held_ = file_.IsStill(path_);
@@ -43,7 +44,8 @@ class PathLock {
 
 constexpr int kMostChanges = 10;  // by other programs, between reading and writing
 
-EditResult EditOnce(const std::string& path, uint64_t most, const std::function<void(std::string& contents)>& edit) {
+EditResult EditOnce(const std::string& path, uint64_t most,
+                    const std::function<void(std::string& contents)>& edit) {
   std::string contents;
   switch (platform::ReadWholeFile(path, most, contents)) {
     case platform::ReadResult::Done:
@@ -60,10 +62,12 @@ EditResult EditOnce(const std::string& path, uint64_t most, const std::function<
 
 }  // namespace
 
-EditResult EditTextFile(const std::string& path, uint64_t most, const std::function<void(std::string& contents)>& edit) {
+EditResult EditTextFile(const std::string& path, uint64_t most,
+                        const std::function<void(std::string& contents)>& edit) {
   const platform::PathParts parts = platform::SplitPath(path);
   const std::string folder = std::string(parts.drive) + std::string(parts.folder);
-  if (path.empty() || (!folder.empty() && !platform::MakeFolders(folder))) return EditResult::Failed;
+  if (path.empty() || (!folder.empty() && !platform::MakeFolders(folder)))
+    return EditResult::Failed;
   const PathLock lock(path);
   if (!lock.Held()) return EditResult::Failed;
   platform::HeldFile file;  // an editor knows nothing of our lock

@@ -8,12 +8,14 @@
 
 namespace fotomill {
 
-// A zero-terminated text of at most `capacity` characters in place: the fixed buffers of records and settings.
+// A zero-terminated text of at most `capacity` characters in place: the fixed buffers of records
+// and settings.
 template <size_t capacity>
 class FixedText {
  public:
   constexpr FixedText() = default;
-  constexpr FixedText(std::string_view text) { AssignCut(text); }  // NOLINT: a literal is a fixed text
+  // NOLINT: a literal is a fixed text
+  constexpr FixedText(std::string_view text) { AssignCut(text); }
 
   // Takes `text` when it fits; otherwise returns false and changes nothing.
   [[nodiscard]] constexpr bool Assign(std::string_view text) {
@@ -21,11 +23,13 @@ class FixedText {
     AssignCut(text);
     return true;
   }
-  // Takes the first `capacity` characters, up to a zero byte if there is one. For texts that are shown, never for paths.
+  // Takes the first `capacity` characters, up to a zero byte if there is one. For texts that are
+  // shown, never for paths.
   constexpr void AssignCut(std::string_view text) {
     text = text.substr(0, std::min(text.find('\0'), capacity));
     std::copy(text.begin(), text.end(), characters_.begin());
-    std::fill(characters_.begin() + static_cast<std::ptrdiff_t>(text.size()), characters_.end(), '\0');
+    std::fill(characters_.begin() + static_cast<std::ptrdiff_t>(text.size()), characters_.end(),
+              '\0');
   }
   // Makes it empty and its bytes all zero, as records on disk have them.
   constexpr void Clear() { characters_.fill('\0'); }
@@ -38,7 +42,8 @@ class FixedText {
   constexpr char* data() { return characters_.data(); }
   constexpr bool empty() const { return characters_[0] == '\0'; }
   static constexpr size_t Capacity() { return capacity; }  // characters, without the closing zero
-  constexpr operator std::string_view() const { return view(); }  // NOLINT: reads as the text it holds
+  // NOLINT: reads as the text it holds
+  constexpr operator std::string_view() const { return view(); }
 
  private:
   constexpr size_t Length() const {

@@ -9,7 +9,8 @@ namespace fotomill {
 
 namespace {
 
-constexpr std::string_view kByteOrderMark = "\xEF\xBB\xBF";  // Windows editors put it in front of UTF-8
+// Windows editors put it in front of UTF-8
+constexpr std::string_view kByteOrderMark = "\xEF\xBB\xBF";
 constexpr std::string_view kBlanks = " \t";
 
 struct Line {
@@ -54,7 +55,8 @@ bool EntryOf(std::string_view line, IniEntry& entry) {
 // Copies the text line by line and makes the changes on the way.
 class IniEditor {
  public:
-  IniEditor(std::string_view section, std::span<const IniEdit> edits) : section_(section), edits_(edits) {
+  IniEditor(std::string_view section, std::span<const IniEdit> edits)
+      : section_(section), edits_(edits) {
     for (const IniEdit& edit : edits) open_.emplace(edit.key, &edit);
   }
 
@@ -100,7 +102,8 @@ class IniEditor {
     out_ += line.end;
   }
 
-  // New keys come behind the last entry of the section's first part, before comments that may belong to the next one.
+  // New keys come behind the last entry of the section's first part, before comments that may
+  // belong to the next one.
   void RememberPlace() {
     place_ = lastEntry_;
     placeFound_ = true;
@@ -139,7 +142,8 @@ class IniEditor {
 
 }  // namespace
 
-IniReader::IniReader(std::string_view text, std::string_view section) : rest_(text), section_(section) {}
+IniReader::IniReader(std::string_view text, std::string_view section)
+    : rest_(text), section_(section) {}
 
 bool IniReader::Next(IniEntry& entry) {
   while (!rest_.empty()) {
@@ -155,7 +159,8 @@ bool IniReader::Next(IniEntry& entry) {
   return false;
 }
 
-std::optional<std::string_view> FindIniValue(std::string_view text, std::string_view section, std::string_view key) {
+std::optional<std::string_view> FindIniValue(std::string_view text, std::string_view section,
+                                             std::string_view key) {
   IniReader reader(text, section);
   for (IniEntry entry; reader.Next(entry);) {
     if (entry.key == key) return entry.value;
@@ -163,10 +168,13 @@ std::optional<std::string_view> FindIniValue(std::string_view text, std::string_
   return std::nullopt;
 }
 
-std::string EditIni(std::string_view text, std::string_view section, std::span<const IniEdit> edits) {
+std::string EditIni(std::string_view text, std::string_view section,
+                    std::span<const IniEdit> edits) {
   return IniEditor(section, edits).Edit(text);
 }
 
-bool IsWideText(std::string_view text) { return text.starts_with("\xFF\xFE") || text.starts_with("\xFE\xFF"); }
+bool IsWideText(std::string_view text) {
+  return text.starts_with("\xFF\xFE") || text.starts_with("\xFE\xFF");
+}
 
 }  // namespace fotomill

@@ -8,9 +8,10 @@
 
 namespace fotomill {
 
-// The text of an INI file: lines "[section]", lines "key=value", anything else (comments, empty lines) is kept and means
-// nothing. Bytes are taken as they are. Section and key names are matched exactly; blanks around a key and a section line
-// do not count. The value is everything behind the "=", blanks included. Lines end in LF or CR LF.
+// The text of an INI file: lines "[section]", lines "key=value", anything else (comments, empty
+// lines) is kept and means nothing. Bytes are taken as they are. Section and key names are matched
+// exactly; blanks around a key and a section line do not count. The value is everything behind the
+// "=", blanks included. Lines end in LF or CR LF.
 //
 // Where a key stands more than once in its section, the first one counts.
 
@@ -21,7 +22,8 @@ struct IniEntry {
   size_t line = 0;  // counted from 1
 };
 
-// Walks the entries of one section in file order, also where the section is divided. The text outlives the reader.
+// Walks the entries of one section in file order, also where the section is divided. The text
+// outlives the reader.
 class IniReader {
  public:
   // Reads one section; the text must outlive it.
@@ -37,7 +39,8 @@ class IniReader {
 };
 
 // The value that counts of one key, nullopt when the section does not hold it.
-std::optional<std::string_view> FindIniValue(std::string_view text, std::string_view section, std::string_view key);
+std::optional<std::string_view> FindIniValue(std::string_view text, std::string_view section,
+                                             std::string_view key);
 
 // One change: the value that a key gets (no line breaks in it), or its removal.
 struct IniEdit {
@@ -45,12 +48,14 @@ struct IniEdit {
   std::optional<std::string_view> value;
 };
 
-// The text with changes made to one section; everything else stays byte for byte. A key that is there keeps its place, new
-// keys come to the end of the section, and the section to the end of the text if there is none. Lines get the line
-// end that the text has. `edits` names no key twice.
-std::string EditIni(std::string_view text, std::string_view section, std::span<const IniEdit> edits);
+// The text with changes made to one section; everything else stays byte for byte. A key that is
+// there keeps its place, new keys come to the end of the section, and the section to the end of the
+// text if there is none. Lines get the line end that the text has. `edits` names no key twice.
+std::string EditIni(std::string_view text, std::string_view section,
+                    std::span<const IniEdit> edits);
 
-// Whether the text is written in another encoding (UTF-16), so that it can neither be read nor changed byte by byte.
+// Whether the text is written in another encoding (UTF-16), so that it can neither be read nor
+// changed byte by byte.
 bool IsWideText(std::string_view text);
 
 }  // namespace fotomill

@@ -20,7 +20,8 @@ const std::array<uint32_t, 64>& Sines() {
   static const std::array<uint32_t, 64> sines = [] {
     std::array<uint32_t, 64> made{};
     for (size_t i = 0; i < made.size(); ++i) {
-      made[i] = static_cast<uint32_t>(std::floor(std::abs(std::sin(static_cast<double>(i + 1))) * 4294967296.0));
+      made[i] = static_cast<uint32_t>(
+          std::floor(std::abs(std::sin(static_cast<double>(i + 1))) * 4294967296.0));
     }
     return made;
   }();
@@ -42,7 +43,8 @@ void TakeBlock(const uint8_t* block, State& state) {
     const unsigned round = i / 16;
     const uint8_t* const at = block + 4 * ((kFirstWord[round] + i % 16 * kWordStep[round]) % 16);
     const uint32_t word = at[0] | at[1] << 8 | at[2] << 16 | uint32_t{at[3]} << 24;
-    const uint32_t turned = b + std::rotl(a + Mix(round, b, c, d) + word + Sines()[i], kTurns[round][i % 4]);
+    const uint32_t turned =
+        b + std::rotl(a + Mix(round, b, c, d) + word + Sines()[i], kTurns[round][i % 4]);
     a = d;
     d = c;
     c = b;
@@ -57,7 +59,8 @@ std::string Md5Text(std::span<const uint8_t> bytes) {
   std::vector<uint8_t> text(bytes.begin(), bytes.end());
   text.push_back(0x80);
   while (text.size() % kBlock != kBlock - kLengthSize) text.push_back(0);
-  for (size_t i = 0; i < kLengthSize; ++i) text.push_back(static_cast<uint8_t>(uint64_t{bytes.size()} * 8 >> (8 * i)));
+  for (size_t i = 0; i < kLengthSize; ++i)
+    text.push_back(static_cast<uint8_t>(uint64_t{bytes.size()} * 8 >> (8 * i)));
   State state{0x67452301, 0xefcdab89, 0x98badcfe, 0x10325476};
   for (size_t i = 0; i < text.size(); i += kBlock) TakeBlock(&text[i], state);
   std::string digits;

@@ -32,7 +32,8 @@ bool MatchesPattern(std::string_view text, std::string_view pattern) {
     if (p < pattern.size() && pattern[p] == '*') {
       star = p++;
       resume = t;
-    } else if (p < pattern.size() && (pattern[p] == '?' || LowerCase(pattern[p]) == LowerCase(text[t]))) {
+    } else if (p < pattern.size() &&
+               (pattern[p] == '?' || LowerCase(pattern[p]) == LowerCase(text[t]))) {
       ++t;
       ++p;
     } else if (star != std::string_view::npos) {
@@ -66,7 +67,9 @@ int CompareNatural(std::string_view a, std::string_view b) {
 bool MatchesFilter(std::string_view text, std::string_view pattern) {
   if (pattern.find_first_of("*?") != std::string_view::npos) return MatchesPattern(text, pattern);
   const auto same = [](char a, char b) { return LowerCase(a) == LowerCase(b); };
-  return std::search(text.begin(), text.end(), pattern.begin(), pattern.end(), same) != text.end() || pattern.empty();
+  return std::search(text.begin(), text.end(), pattern.begin(), pattern.end(), same) !=
+             text.end() ||
+         pattern.empty();
 }
 
 }  // namespace fotomill::desktop

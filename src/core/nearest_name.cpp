@@ -10,7 +10,8 @@ namespace fotomill {
 
 namespace {
 
-constexpr size_t kLongestName = 64;  // longer texts are not typing errors, and the table below stays small
+// longer texts are not typing errors, and the table below stays small
+constexpr size_t kLongestName = 64;
 
 // Number of characters to change, insert, delete or swap with their neighbour to turn `a` into `b`.
 size_t EditDistance(std::string_view a, std::string_view b) {
@@ -21,8 +22,8 @@ size_t EditDistance(std::string_view a, std::string_view b) {
     for (size_t j = 1; j <= b.size(); ++j) {
       const size_t change = LowerCase(a[i - 1]) == LowerCase(b[j - 1]) ? 0 : 1;
       row[j] = std::min({last[j] + 1, row[j - 1] + 1, last[j - 1] + change});
-      const bool swapped =
-          i > 1 && j > 1 && LowerCase(a[i - 1]) == LowerCase(b[j - 2]) && LowerCase(a[i - 2]) == LowerCase(b[j - 1]);
+      const bool swapped = i > 1 && j > 1 && LowerCase(a[i - 1]) == LowerCase(b[j - 2]) &&
+                           LowerCase(a[i - 2]) == LowerCase(b[j - 1]);
       if (swapped) row[j] = std::min(row[j], beforeLast[j - 2] + 1);
     }
     std::swap(beforeLast, last);
@@ -32,11 +33,13 @@ size_t EditDistance(std::string_view a, std::string_view b) {
 }
 
 // The name whose distance is below `fewest` and smallest, with at least one character in place.
-std::string_view NearestBelow(size_t fewest, std::string_view typed, std::span<const std::string_view> names) {
+std::string_view NearestBelow(size_t fewest, std::string_view typed,
+                              std::span<const std::string_view> names) {
   std::string_view nearest;
   for (const std::string_view name : names) {
     if (name.size() > kLongestName) continue;
-    const bool beginning = typed.size() >= 2 && EqualIgnoringCase(name.substr(0, typed.size()), typed);
+    const bool beginning =
+        typed.size() >= 2 && EqualIgnoringCase(name.substr(0, typed.size()), typed);
     const size_t distance = beginning ? 1 : EditDistance(typed, name);
     if (distance < fewest && distance < std::max(typed.size(), name.size())) {
       fewest = distance;
@@ -50,7 +53,8 @@ std::string_view NearestBelow(size_t fewest, std::string_view typed, std::span<c
 
 std::string_view NearestName(std::string_view typed, std::span<const std::string_view> names) {
   if (typed.empty() || typed.size() > kLongestName) return {};
-  const size_t fewest = typed.size() / 3 + 2;  // one slip in a short word, one more for every three letters
+  // one slip in a short word, one more for every three letters
+  const size_t fewest = typed.size() / 3 + 2;
   return NearestBelow(fewest, typed, names);
 }
 

@@ -5,7 +5,8 @@
 
 namespace fotomill {
 
-// Where a codec or a long computation tells how far it is. Implemented by the faces; called from the thread that works.
+// Where a codec or a long computation tells how far it is. Implemented by the faces; called from
+// the thread that works.
 class ProgressSink {
  public:
   virtual ~ProgressSink() = default;

@@ -31,7 +31,8 @@ void AppendEscaped(std::string& result, std::string_view bytes) {
 }  // namespace
 
 std::string EscapeControls(std::string_view text) {
-  if (std::all_of(text.begin(), text.end(), [](char c) { return c >= 0x20 && c < 0x7F; })) return std::string(text);
+  if (std::all_of(text.begin(), text.end(), [](char c) { return c >= 0x20 && c < 0x7F; }))
+    return std::string(text);
   std::string result;
   result.reserve(text.size());
   while (!text.empty()) {

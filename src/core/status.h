@@ -15,7 +15,8 @@ enum class [[nodiscard]] Status : int32_t{
 // The number that JSON, plug-ins and the manual know a status by.
 constexpr int32_t StatusNumber(Status status) { return static_cast<int32_t>(status); }
 
-// The user message of a status, "Ok" for success; numbers outside the table (a plug-in may return any) give an empty text.
+// The user message of a status, "Ok" for success; numbers outside the table (a plug-in may return
+// any) give an empty text.
 constexpr std::string_view StatusMessage(Status status) {
   switch (status) {
 #define STATUS(number, name, message) \
@@ -28,9 +29,10 @@ constexpr std::string_view StatusMessage(Status status) {
 }
 
 // Passes any status but Ok on to the caller.
-#define RETURN_IF_BAD(expression)                                                                           \
-  do {                                                                                                      \
-    if (const ::fotomill::Status status_ = (expression); status_ != ::fotomill::Status::Ok) return status_; \
+#define RETURN_IF_BAD(expression)                                                           \
+  do {                                                                                      \
+    if (const ::fotomill::Status status_ = (expression); status_ != ::fotomill::Status::Ok) \
+      return status_;                                                                       \
   } while (false)
 
 }  // namespace fotomill

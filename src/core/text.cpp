@@ -25,7 +25,8 @@ int64_t LeadingInteger(std::string_view text) {
   int64_t value = 0;
   for (; i < text.size() && text[i] >= '0' && text[i] <= '9'; ++i) {
     const int64_t digit = text[i] - '0';
-    if (!CheckedMultiply<int64_t>(value, 10, value) || !CheckedAdd(value, negative ? -digit : digit, value)) {
+    if (!CheckedMultiply<int64_t>(value, 10, value) ||
+        !CheckedAdd(value, negative ? -digit : digit, value)) {
       return negative ? INT64_MIN : INT64_MAX;
     }
   }

@@ -7,8 +7,12 @@
 namespace fotomill {
 
 // Case of ASCII letters only: extensions and keywords, whatever the user's language.
-constexpr char LowerCase(char c) { return c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c; }
-constexpr char UpperCase(char c) { return c >= 'a' && c <= 'z' ? static_cast<char>(c - 'a' + 'A') : c; }
+constexpr char LowerCase(char c) {
+  return c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c;
+}
+constexpr char UpperCase(char c) {
+  return c >= 'a' && c <= 'z' ? static_cast<char>(c - 'a' + 'A') : c;
+}
 // A to Z and a to z only.
 constexpr bool IsLetter(char c) { return LowerCase(c) >= 'a' && LowerCase(c) <= 'z'; }
 std::string LowerCase(std::string_view text);  // other bytes stay
@@ -23,11 +27,12 @@ constexpr bool EqualIgnoringCase(std::string_view a, std::string_view b) {
   return true;
 }
 
-// The whole number that a text begins with: white space, a sign, decimal digits; whatever follows is ignored. 0 without a
-// digit; a number beyond 64 bits gives the nearest one that fits.
+// The whole number that a text begins with: white space, a sign, decimal digits; whatever follows
+// is ignored. 0 without a digit; a number beyond 64 bits gives the nearest one that fits.
 int64_t LeadingInteger(std::string_view text);
 
-// Item `index`, from 0, of a list whose items are separated by ";"; "Unknown" for an index that the list does not have.
+// Item `index`, from 0, of a list whose items are separated by ";"; "Unknown" for an index that the
+// list does not have.
 std::string_view ListItem(std::string_view list, int64_t index);
 
 // A number in decimal with a comma between every group of three digits.

@@ -19,7 +19,8 @@ size_t CharacterLength(std::string_view text) {
   const uint8_t first = ByteAt(text, 0);
   if (first < 0x80) return 1;
   size_t length = 0;
-  uint8_t lowest = 0x80, highest = 0xBF;  // of the second byte: neither too long a form, nor a surrogate, nor too large
+  // of the second byte: neither too long a form, nor a surrogate, nor too large
+  uint8_t lowest = 0x80, highest = 0xBF;
   if (first >= 0xC2 && first <= 0xDF) {
     length = 2;
   } else if (first >= 0xE0 && first <= 0xEF) {
@@ -62,8 +63,8 @@ char32_t NextCharacter(std::string_view& text, char32_t unknown) {
 }
 
 size_t CharacterCount(std::string_view text) {
-  return static_cast<size_t>(
-      std::count_if(text.begin(), text.end(), [](char c) { return !Continues(static_cast<uint8_t>(c)); }));
+  return static_cast<size_t>(std::count_if(
+      text.begin(), text.end(), [](char c) { return !Continues(static_cast<uint8_t>(c)); }));
 }
 
 std::string_view CutText(std::string_view text, size_t limit) {

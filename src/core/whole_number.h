@@ -9,12 +9,13 @@
 
 namespace fotomill {
 
-// The decimal number at the start of a text, which is taken off it; blanks before it and a sign are allowed. nullopt, and
-// the text as it was, if there is none or it does not fit.
+// The decimal number at the start of a text, which is taken off it; blanks before it and a sign are
+// allowed. nullopt, and the text as it was, if there is none or it does not fit.
 template <std::integral T = int32_t>
 std::optional<T> TakeNumber(std::string_view& text) {
   std::string_view rest = text.substr(std::min(text.find_first_not_of(" \t"), text.size()));
-  if (rest.starts_with('+') && rest.size() > 1 && rest[1] >= '0' && rest[1] <= '9') rest.remove_prefix(1);
+  if (rest.starts_with('+') && rest.size() > 1 && rest[1] >= '0' && rest[1] <= '9')
+    rest.remove_prefix(1);
   T number = 0;
   const auto [end, error] = std::from_chars(rest.data(), rest.data() + rest.size(), number);
   if (error != std::errc()) return std::nullopt;

@@ -23,7 +23,8 @@ constexpr int kDeepestFontFolder = 6;
 constexpr uint32_t kUnknownCharacter = 0xFFFD;
 constexpr std::string_view kEllipsis = "\xE2\x80\xA6";
 
-// Tried in this order when a family is missing, and for letters that the family lacks. The first has Arial's widths.
+// Tried in this order when a family is missing, and for letters that the family lacks. The first
+// has Arial's widths.
 constexpr std::string_view kOtherFamilies[] = {
     "Liberation Sans",
     "Arial",
@@ -39,7 +40,8 @@ constexpr std::string_view kOtherFamilies[] = {
     "WQY Zen Hei",
 };
 
-// A font's name as files and people write it: "Liberation Sans" and "LiberationSans-Regular.ttf" are the same.
+// A font's name as files and people write it: "Liberation Sans" and "LiberationSans-Regular.ttf"
+// are the same.
 std::string PlainFamily(std::string_view name) {
   std::string plain;
   for (const char c : LowerCase(name)) {
@@ -51,7 +53,8 @@ std::string PlainFamily(std::string_view name) {
 
 bool IsFontFile(std::string_view name) {
   const std::string extension = LowerCase(platform::ExtensionOf(name));
-  return extension == "ttf" || extension == "otf" || extension == "ttc" || extension == "pfb" || extension == "t1";
+  return extension == "ttf" || extension == "otf" || extension == "ttc" || extension == "pfb" ||
+         extension == "t1";
 }
 
 using FontFiles = std::multimap<std::string, std::string>;  // path by plain family
@@ -61,7 +64,8 @@ void CollectFonts(const std::string& folder, int depth, FontFiles& fonts) {
   if (!entries || depth > kDeepestFontFolder) return;
   for (const platform::FolderEntry& entry : *entries) {
     const std::string path = platform::JoinFolder(folder, entry.name);
-    if (entry.kind == platform::FileKind::Folder && !entry.link) CollectFonts(path, depth + 1, fonts);
+    if (entry.kind == platform::FileKind::Folder && !entry.link)
+      CollectFonts(path, depth + 1, fonts);
     if (entry.kind == platform::FileKind::Regular && IsFontFile(entry.name)) {
       fonts.emplace(PlainFamily(platform::SplitPath(entry.name).base), path);
     }
@@ -106,15 +110,19 @@ struct CaptionFont::Fonts {
     return false;
   }
 
-  // The face that has a character, and its number there; when none has, those of the sign for an unknown one.
+  // The face that has a character, and its number there; when none has, those of the sign for an
+  // unknown one.
   std::pair<FT_Face, FT_UInt> FaceFor(uint32_t character) {
     for (size_t i = 0; i < faces.size() || OpenOther(); ++i) {
-      if (const FT_UInt glyph = FT_Get_Char_Index(faces[i], character); glyph != 0) return {faces[i], glyph};
+      if (const FT_UInt glyph = FT_Get_Char_Index(faces[i], character); glyph != 0)
+        return {faces[i], glyph};
     }
-    return character == kUnknownCharacter ? std::pair{faces[0], FT_UInt{0}} : FaceFor(kUnknownCharacter);
+    return character == kUnknownCharacter ? std::pair{faces[0], FT_UInt{0}}
+                                          : FaceFor(kUnknownCharacter);
   }
 
-  // Calls `put` with the glyph slot and the place of each letter, in 64ths of a pixel, and returns where the line ends.
+  // Calls `put` with the glyph slot and the place of each letter, in 64ths of a pixel, and returns
+  // where the line ends.
   template <typename Put>
   FT_Pos Walk(std::string_view text, FT_Int32 load, Put put) {
     FT_Pos pen = 0;
@@ -122,10 +130,12 @@ struct CaptionFont::Fonts {
     FT_UInt glyphBefore = 0;
     while (!text.empty()) {
       uint32_t character = NextCharacter(text, kUnknownCharacter);
-      if (character < 0x20 || (character >= 0x7F && character < 0xA0)) character = kUnknownCharacter;
+      if (character < 0x20 || (character >= 0x7F && character < 0xA0))
+        character = kUnknownCharacter;
       const auto [face, glyph] = FaceFor(character);
       FT_Vector kerning = {0, 0};
-      if (face == before) (void)FT_Get_Kerning(face, glyphBefore, glyph, FT_KERNING_DEFAULT, &kerning);
+      if (face == before)
+        (void)FT_Get_Kerning(face, glyphBefore, glyph, FT_KERNING_DEFAULT, &kerning);
       pen += kerning.x;
       if (FT_Load_Glyph(face, glyph, load) != 0) continue;
       put(*face->glyph, pen);
@@ -152,7 +162,8 @@ Status CaptionFont::Open(std::string_view family, int32_t height) {
   fonts_->height = height;
   for (const std::string& folder : platform::FontFolders()) CollectFonts(folder, 0, fonts_->files);
   if (fonts_->OpenFamily(family) || fonts_->OpenOther()) return Status::Ok;
-  const bool any = std::ranges::any_of(fonts_->files, [&](const auto& file) { return fonts_->OpenFile(file.second); });
+  const bool any = std::ranges::any_of(
+      fonts_->files, [&](const auto& file) { return fonts_->OpenFile(file.second); });
   return any ? Status::Ok : Status::ResourceError;
 }
 
@@ -173,23 +184,29 @@ std::string CaptionFont::Fitted(std::string_view text, int32_t width) {
   return fitted;
 }
 
-void CaptionFont::DrawCentred(PackedImage& image, const Rectangle& band, std::string_view text, Color color) {
+void CaptionFont::DrawCentred(PackedImage& image, const Rectangle& band, std::string_view text,
+                              Color color) {
   const int32_t left = std::max(band.x, 0), right = std::min(band.x + band.width, image.Width());
   const int32_t top = std::max(band.y, 0), bottom = std::min(band.y + band.height, image.Height());
   const int32_t start = band.x + (band.width - WidthOf(text)) / 2;
-  const auto baseline = band.y + static_cast<int32_t>(fonts_->faces[0]->size->metrics.ascender >> 6);
-  const uint8_t ink[] = {static_cast<uint8_t>(color >> 16), static_cast<uint8_t>(color >> 8), static_cast<uint8_t>(color)};
+  const auto baseline =
+      band.y + static_cast<int32_t>(fonts_->faces[0]->size->metrics.ascender >> 6);
+  const uint8_t ink[] = {static_cast<uint8_t>(color >> 16), static_cast<uint8_t>(color >> 8),
+                         static_cast<uint8_t>(color)};
   fonts_->Walk(text, FT_LOAD_RENDER, [&](const FT_GlyphSlotRec& glyph, FT_Pos pen) {
     const FT_Bitmap& bitmap = glyph.bitmap;
     if (bitmap.pixel_mode != FT_PIXEL_MODE_GRAY) return;
     const int32_t glyphX = start + static_cast<int32_t>((pen + 32) >> 6) + glyph.bitmap_left;
     const int32_t glyphY = baseline - glyph.bitmap_top;
-    for (int32_t row = std::max(0, top - glyphY); row < std::min(static_cast<int32_t>(bitmap.rows), bottom - glyphY); ++row) {
+    for (int32_t row = std::max(0, top - glyphY);
+         row < std::min(static_cast<int32_t>(bitmap.rows), bottom - glyphY); ++row) {
       uint8_t* const pixels = image.Row(glyphY + row).data();
       const uint8_t* const coverage = bitmap.buffer + row * bitmap.pitch;
-      for (int32_t x = std::max(0, left - glyphX); x < std::min(static_cast<int32_t>(bitmap.width), right - glyphX); ++x) {
+      for (int32_t x = std::max(0, left - glyphX);
+           x < std::min(static_cast<int32_t>(bitmap.width), right - glyphX); ++x) {
         uint8_t* const pixel = pixels + (glyphX + x) * 3;
-        for (int32_t channel = 0; channel < 3; ++channel) pixel[channel] = Blend(pixel[channel], ink[channel], coverage[x]);
+        for (int32_t channel = 0; channel < 3; ++channel)
+          pixel[channel] = Blend(pixel[channel], ink[channel], coverage[x]);
       }
     }
   });

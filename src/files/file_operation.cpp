@@ -48,15 +48,16 @@ Outcome CopyFile(const std::string& from, const std::string& to, platform::Exist
 Outcome CopyTree(const std::string& from, const std::string& to, int depth) {
   if (!platform::IsFolder(from)) return CopyFile(from, to, platform::Existing::Refuse);
   if (depth > kDeepest) return Tr(kTooDeep);
-  if (to.starts_with(platform::JoinFolder(from, ""))) return Tr("A folder cannot be copied into itself.");
+  if (to.starts_with(platform::JoinFolder(from, "")))
+    return Tr("A folder cannot be copied into itself.");
   if (platform::ExistenceOf(to) == platform::Existence::Yes) return Tr(kTaken);
   const auto entries = platform::ListFolder(from);
   if (!entries) return WithReason(Tr("The folder cannot be read."));
   if (!platform::MakeFolders(to)) return WithReason(Tr("The folder cannot be created."));
   for (const platform::FolderEntry& entry : *entries) {
-    Outcome outcome = entry.link
-                          ? Outcome(Tr("It contains a link, which is not copied."))
-                          : CopyTree(platform::JoinFolder(from, entry.name), platform::JoinFolder(to, entry.name), depth + 1);
+    Outcome outcome = entry.link ? Outcome(Tr("It contains a link, which is not copied."))
+                                 : CopyTree(platform::JoinFolder(from, entry.name),
+                                            platform::JoinFolder(to, entry.name), depth + 1);
     if (!outcome.empty()) return outcome;
   }
   return {};
@@ -64,10 +65,12 @@ Outcome CopyTree(const std::string& from, const std::string& to, int depth) {
 
 Outcome DeleteTree(const std::string& path, int depth) {
   if (!platform::IsFolder(path) || platform::FactsOf(path).link) {
-    return platform::DeleteFile(path) ? Outcome() : Outcome(WithReason(Tr("It could not be deleted.")));
+    return platform::DeleteFile(path) ? Outcome()
+                                      : Outcome(WithReason(Tr("It could not be deleted.")));
   }
   if (depth > kDeepest) return Tr(kTooDeep);
-  for (const platform::FolderEntry& entry : platform::ListFolder(path).value_or(std::vector<platform::FolderEntry>())) {
+  for (const platform::FolderEntry& entry :
+       platform::ListFolder(path).value_or(std::vector<platform::FolderEntry>())) {
     Outcome outcome = DeleteTree(platform::JoinFolder(path, entry.name), depth + 1);
     if (!outcome.empty()) return outcome;
   }
@@ -84,15 +87,18 @@ Outcome MoveOne(const std::string& from, const std::string& to) {
   if (existence == platform::Existence::Unknown) return WithReason(Tr("It could not be renamed."));
   if (existence == platform::Existence::Yes && from != to) {
     const platform::FileFacts a = platform::FactsOf(from), b = platform::FactsOf(to);
-    const bool same = a.identity == b.identity && a.device == b.device;  // a name that differs in case only
+    // a name that differs in case only
+    const bool same = a.identity == b.identity && a.device == b.device;
     if (!same) return kTaken;
   }
-  if (to.starts_with(platform::JoinFolder(from, ""))) return Tr("A folder cannot be moved into itself.");
+  if (to.starts_with(platform::JoinFolder(from, "")))
+    return Tr("A folder cannot be moved into itself.");
   const platform::CommitResult result = platform::RenameFile(from, to, platform::Existing::Refuse);
   if (result == platform::CommitResult::Done) return {};
   if (result == platform::CommitResult::Taken) return kTaken;
   if (SameVolume(from, to)) return WithReason(Tr("It could not be renamed."));
-  // On another volume a move is a copy and a deletion; what was copied goes again if the rest of it fails.
+  // On another volume a move is a copy and a deletion; what was copied goes again if the rest of it
+  // fails.
   Outcome outcome = CopyTree(from, to, 0);
   if (!outcome.empty()) {
     if (outcome != kTaken) (void)DeleteTree(to, 0);
@@ -103,18 +109,22 @@ Outcome MoveOne(const std::string& from, const std::string& to) {
 
 Outcome TrashOne(const std::string& path) {
   if (!platform::FileExists(path)) return kGone;
-  return platform::MoveToTrash(path) ? Outcome() : Outcome(Tr("There is no trash on this volume; Shift+Delete deletes permanently."));
+  return platform::MoveToTrash(path)
+             ? Outcome()
+             : Outcome(Tr("There is no trash on this volume; Shift+Delete deletes permanently."));
 }
 
 Outcome Restore(const std::string& path) {
   if (platform::FileExists(path)) return kTaken;
-  return platform::RestoreFromTrash(path) ? Outcome() : Outcome(Tr("It is no longer in the trash."));
+  return platform::RestoreFromTrash(path) ? Outcome()
+                                          : Outcome(Tr("It is no longer in the trash."));
 }
 
 // The file becomes what it was before, and what it was until now is kept in its place.
 Outcome Exchange(const FileStep& step, const FileOperationOptions& options) {
   if (!platform::FileExists(step.from)) return kGone;
-  if (step.previous->HasChanged(step.from)) return Tr("It was changed since, so it was left alone.");
+  if (step.previous->HasChanged(step.from))
+    return Tr("It was changed since, so it was left alone.");
   PreviousFile now;
   if (!now.Keep(step.from)) return Tr("There is not enough disk space to keep the current file.");
   if (options.replacing) options.replacing(step.from);
@@ -139,15 +149,18 @@ Outcome DoStep(FileOperationKind kind, const FileStep& step, const FileOperation
 
 // A copy that somebody has worked on since stays.
 Outcome RemoveCopy(const FileStep& step) {
-  const platform::FileFacts copy = platform::FactsOf(step.to), original = platform::FactsOf(step.from);
+  const platform::FileFacts copy = platform::FactsOf(step.to),
+                            original = platform::FactsOf(step.from);
   if (copy.kind == platform::FileKind::Missing) return kGone;
-  const bool changed = copy.kind == platform::FileKind::Regular && original.kind == platform::FileKind::Regular &&
+  const bool changed = copy.kind == platform::FileKind::Regular &&
+                       original.kind == platform::FileKind::Regular &&
                        (copy.size != original.size || copy.modified != original.modified);
   if (changed) return Tr("The copy was changed since, so it was left alone.");
   return TrashOne(step.to);
 }
 
-Outcome UndoStep(FileOperationKind kind, const FileStep& step, const FileOperationOptions& options) {
+Outcome UndoStep(FileOperationKind kind, const FileStep& step,
+                 const FileOperationOptions& options) {
   switch (kind) {
     case FileOperationKind::Rename:
     case FileOperationKind::Move: return MoveOne(step.to, step.from);
@@ -161,8 +174,8 @@ Outcome UndoStep(FileOperationKind kind, const FileStep& step, const FileOperati
 
 }  // namespace
 
-FileOperation PlanFileOperation(FileOperationKind kind, const std::vector<std::string>& paths, const std::string& folder,
-                                const FileOperationOptions& options) {
+FileOperation PlanFileOperation(FileOperationKind kind, const std::vector<std::string>& paths,
+                                const std::string& folder, const FileOperationOptions& options) {
   FileOperation operation{kind, {}};
   std::set<std::string> planned;
   for (const std::string& path : paths) {
@@ -173,7 +186,8 @@ FileOperation PlanFileOperation(FileOperationKind kind, const std::vector<std::s
     std::string target = platform::JoinFolder(folder, platform::FileNameOf(path));
     if (kind == FileOperationKind::Move && target == path) continue;
     const TakenTest taken = [&](const std::string& candidate) {
-      return planned.contains(candidate) ? platform::Existence::Yes : platform::ExistenceOf(candidate);
+      return planned.contains(candidate) ? platform::Existence::Yes
+                                         : platform::ExistenceOf(candidate);
     };
     if (taken(target) == platform::Existence::Yes) {
       (void)MakeNumberedVariant(target, options.firstVariant, options.lastVariant, taken);
@@ -215,7 +229,8 @@ FileOperationResult Revert(const FileOperation& operation, const FileOperationOp
   return result;
 }
 
-FileOperationResult DeleteForGood(const std::vector<std::string>& paths, const FileOperationProgress& progress) {
+FileOperationResult DeleteForGood(const std::vector<std::string>& paths,
+                                  const FileOperationProgress& progress) {
   FileOperationResult result{{FileOperationKind::Trash, {}}, {}};
   for (size_t i = 0; i < paths.size(); ++i) {
     if (progress && !progress(i, paths.size())) break;
@@ -227,17 +242,29 @@ FileOperationResult DeleteForGood(const std::vector<std::string>& paths, const F
 
 std::string FileOperationName(const FileOperation& operation) {
   const size_t count = operation.steps.size();
-  const std::string_view name = count == 1 ? platform::FileNameOf(operation.steps[0].from) : std::string_view();
-  const auto named = [&](const char* one, std::string many) { return count == 1 ? Tr(one, name) : std::move(many); };
+  const std::string_view name =
+      count == 1 ? platform::FileNameOf(operation.steps[0].from) : std::string_view();
+  const auto named = [&](const char* one, std::string many) {
+    return count == 1 ? Tr(one, name) : std::move(many);
+  };
   switch (operation.kind) {
-    case FileOperationKind::Rename: return named(TrLater("rename of %1"), TrCount("rename of %1 file", "rename of %1 files", count));
-    case FileOperationKind::Move: return named(TrLater("move of %1"), TrCount("move of %1 file", "move of %1 files", count));
-    case FileOperationKind::Copy: return named(TrLater("copy of %1"), TrCount("copy of %1 file", "copy of %1 files", count));
-    case FileOperationKind::Create: return named(TrLater("output of %1"), TrCount("output of %1 file", "output of %1 files", count));
-    case FileOperationKind::Turn: return named(TrLater("rotation of %1"), TrCount("rotation of %1 file", "rotation of %1 files", count));
+    case FileOperationKind::Rename:
+      return named(TrLater("rename of %1"),
+                   TrCount("rename of %1 file", "rename of %1 files", count));
+    case FileOperationKind::Move:
+      return named(TrLater("move of %1"), TrCount("move of %1 file", "move of %1 files", count));
+    case FileOperationKind::Copy:
+      return named(TrLater("copy of %1"), TrCount("copy of %1 file", "copy of %1 files", count));
+    case FileOperationKind::Create:
+      return named(TrLater("output of %1"),
+                   TrCount("output of %1 file", "output of %1 files", count));
+    case FileOperationKind::Turn:
+      return named(TrLater("rotation of %1"),
+                   TrCount("rotation of %1 file", "rotation of %1 files", count));
     case FileOperationKind::Trash: break;
   }
-  return named(TrLater("deletion of %1"), TrCount("deletion of %1 file", "deletion of %1 files", count));
+  return named(TrLater("deletion of %1"),
+               TrCount("deletion of %1 file", "deletion of %1 files", count));
 }
 
 void UndoList::Keep(std::vector<FileOperation>& list, FileOperation operation) {

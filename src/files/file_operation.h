@@ -25,7 +25,8 @@ class PreviousFile;
 struct FileStep {
   std::string from;
   std::string to;                               // empty for Trash and Turn
-  std::shared_ptr<PreviousFile> previous = {};  // Turn: what the file was before; after Revert, what it was before that
+  // Turn: what the file was before; after Revert, what it was before that
+  std::shared_ptr<PreviousFile> previous = {};
 };
 
 // What was done in one go, in order.
@@ -47,31 +48,38 @@ struct FileOperationResult {
   std::string note = {};  // a remark on what was done, as a sentence
 };
 
-// What an operation needs to know of the program's settings and of what else keeps records of files.
+// What an operation needs to know of the program's settings and of what else keeps records of
+// files.
 struct FileOperationOptions {
-  int64_t firstVariant = 1, lastVariant = INT32_MAX;            // numbers of copies whose name is taken
-  std::function<void(const std::string& path)> replacing = {};  // before a file gets other contents: thumbnails of it go
+  // numbers of copies whose name is taken
+  int64_t firstVariant = 1, lastVariant = INT32_MAX;
+  // before a file gets other contents: thumbnails of it go
+  std::function<void(const std::string& path)> replacing = {};
 };
 
 // Told before each step; false ends the operation there.
 using FileOperationProgress = std::function<bool(size_t index, size_t count)>;
 
-// The steps of an operation on files and folders: into `folder` under their own names, or into the trash. Files that are there
-// already are left out of a move, and a copy gets a number, as it does where the name is taken.
-FileOperation PlanFileOperation(FileOperationKind kind, const std::vector<std::string>& paths, const std::string& folder,
+// The steps of an operation on files and folders: into `folder` under their own names, or into the
+// trash. Files that are there already are left out of a move, and a copy gets a number, as it does
+// where the name is taken.
+FileOperation PlanFileOperation(FileOperationKind kind, const std::vector<std::string>& paths,
+                                const std::string& folder,
                                 const FileOperationOptions& options = {});
 
-// Does the steps of an operation. Nothing is ever replaced: where a name is taken meanwhile the step fails. Files keep their
-// times. May take long; any thread.
-FileOperationResult CarryOut(const FileOperation& operation, const FileOperationOptions& options = {},
+// Does the steps of an operation. Nothing is ever replaced: where a name is taken meanwhile the
+// step fails. Files keep their times. May take long; any thread.
+FileOperationResult CarryOut(const FileOperation& operation,
+                             const FileOperationOptions& options = {},
                              const FileOperationProgress& progress = {});
-// Undoes an operation, last step first: files go back to where they were, copies that nobody has changed and outputs go to
-// the trash.
+// Undoes an operation, last step first: files go back to where they were, copies that nobody has
+// changed and outputs go to the trash.
 FileOperationResult Revert(const FileOperation& operation, const FileOperationOptions& options = {},
                            const FileOperationProgress& progress = {});
 
 // Deletes files permanently, and folders with what is in them.
-FileOperationResult DeleteForGood(const std::vector<std::string>& paths, const FileOperationProgress& progress = {});
+FileOperationResult DeleteForGood(const std::vector<std::string>& paths,
+                                  const FileOperationProgress& progress = {});
 
 // "rename of 12 files", "move of beach.jpg"
 std::string FileOperationName(const FileOperation& operation);
@@ -80,12 +88,17 @@ std::string FileOperationName(const FileOperation& operation);
 class UndoList {
  public:
   explicit UndoList(size_t most) : most_(most) {}
-  // A new operation; what had been undone can no longer be redone. Operations without steps are not kept.
+  // A new operation; what had been undone can no longer be redone. Operations without steps are not
+  // kept.
   void Add(FileOperation operation);
   bool CanUndo() const { return !done_.empty(); }
   bool CanRedo() const { return !undone_.empty(); }
-  std::string UndoName() const { return CanUndo() ? FileOperationName(done_.back()) : std::string(); }
-  std::string RedoName() const { return CanRedo() ? FileOperationName(undone_.back()) : std::string(); }
+  std::string UndoName() const {
+    return CanUndo() ? FileOperationName(done_.back()) : std::string();
+  }
+  std::string RedoName() const {
+    return CanRedo() ? FileOperationName(undone_.back()) : std::string();
+  }
   // Hands out what is to be undone or redone; the result comes back by Undone or Redone.
   FileOperation PopUndo();
   FileOperation PopRedo();

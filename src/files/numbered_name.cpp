@@ -13,8 +13,8 @@ constexpr int kMostLostRaces = 100;
 
 }  // namespace
 
-VariantSearch MakeNumberedVariant(std::string& path, int64_t first, int64_t last, const TakenTest& taken,
-                                  const StopToken& stop) {
+VariantSearch MakeNumberedVariant(std::string& path, int64_t first, int64_t last,
+                                  const TakenTest& taken, const StopToken& stop) {
   const platform::PathParts parts = platform::SplitPath(path);
   for (int64_t number = first; number <= last; ++number) {
     if (stop.Asked()) return VariantSearch::Stopped;

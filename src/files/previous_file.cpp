@@ -13,7 +13,8 @@ namespace fotomill {
 
 namespace {
 
-// A folder a day, by its number, so that what a killed program left there can be told from what one that runs needs.
+// A folder a day, by its number, so that what a killed program left there can be told from what one
+// that runs needs.
 constexpr int64_t kSecondsOfDay = 86400, kDaysKept = 30;
 int64_t Today() { return platform::Now() / kSecondsOfDay; }
 std::string UndoFolder() { return platform::JoinFolder(DataFolder(), "undo"); }
@@ -27,7 +28,9 @@ std::vector<platform::FolderEntry> EntriesOf(const std::string& folder) {
 
 bool PreviousFile::Keep(const std::string& path) { return kept_.Keep(path, KeptFolder()); }
 
-bool PreviousFile::HasChanged(const std::string& path) const { return !(platform::StampOf(path) == replaced_); }
+bool PreviousFile::HasChanged(const std::string& path) const {
+  return !(platform::StampOf(path) == replaced_);
+}
 
 bool PreviousFiles::Keep(const std::string& path) {
   auto file = std::make_shared<PreviousFile>();
@@ -57,10 +60,12 @@ FileOperation PreviousFiles::Operation() {
 void DeleteOldPreviousFiles() {
   for (const platform::FolderEntry& day : EntriesOf(UndoFolder())) {
     const auto number = ParseNumber<int64_t>(day.name);
-    if (day.kind != platform::FileKind::Folder || day.link || !number || *number == Today()) continue;
+    if (day.kind != platform::FileKind::Folder || day.link || !number || *number == Today())
+      continue;
     const std::string folder = platform::JoinFolder(UndoFolder(), day.name);
     for (const platform::FolderEntry& file : EntriesOf(folder)) {
-      if (*number + kDaysKept < Today()) (void)platform::DeleteFile(platform::JoinFolder(folder, file.name));
+      if (*number + kDaysKept < Today())
+        (void)platform::DeleteFile(platform::JoinFolder(folder, file.name));
     }
     (void)platform::DeleteFolder(folder);  // unless there is still something in it
   }

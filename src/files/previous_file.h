@@ -13,7 +13,8 @@
 
 namespace fotomill {
 
-// What a file was before a function replaced it, kept in the data folder until nobody can undo that any more.
+// What a file was before a function replaced it, kept in the data folder until nobody can undo that
+// any more.
 class PreviousFile {
  public:
   // Keeps the file as it is now. False if there is no room for it.
@@ -34,10 +35,12 @@ class PreviousFile {
 class PreviousFiles {
  public:
   // `replacing` is told of each file before it is replaced, on the thread that replaces it.
-  explicit PreviousFiles(std::function<void(const std::string& path)> replacing = {}) : replacing_(std::move(replacing)) {}
+  explicit PreviousFiles(std::function<void(const std::string& path)> replacing = {})
+      : replacing_(std::move(replacing)) {}
   // To be called before a file is replaced. False: it should not be.
   [[nodiscard]] bool Keep(const std::string& path);
-  // To be called at once when a file that was kept has been replaced; what it becomes later is somebody else's work.
+  // To be called at once when a file that was kept has been replaced; what it becomes later is
+  // somebody else's work.
   void Replaced(const std::string& path);
   // The operation of those that were replaced, in the order of their paths; they are handed over.
   FileOperation Operation();

@@ -58,7 +58,8 @@ bool RenameLog::LockFile(bool create) {
   const std::string path = DataFile(kLogName);
   for (int tries = 0; tries < kMostTries; ++tries) {
     StoreFile::OpenResult opened = file_.Open(path, StoreFile::Mode::ReadWrite);
-    if (opened == StoreFile::OpenResult::Missing && create) opened = file_.Open(path, StoreFile::Mode::CreateNew);
+    if (opened == StoreFile::OpenResult::Missing && create)
+      opened = file_.Open(path, StoreFile::Mode::CreateNew);
     if (opened == StoreFile::OpenResult::Exists) continue;  // another run was faster
     if (opened == StoreFile::OpenResult::Missing) return true;
     if (opened != StoreFile::OpenResult::Done || !file_.Lock()) return false;
@@ -73,7 +74,8 @@ bool RenameLog::LockForUndo() { return DataFile(kLogName).empty() || LockFile(fa
 // A log that takes the place of one that was shortened meanwhile goes on with what is left of that.
 bool RenameLog::Begin(bool fresh) {
   const std::string path = DataFile(kLogName);
-  if (path.empty() || !platform::MakeFolders(platform::FolderOf(path)) || !LockFile(true)) return false;
+  if (path.empty() || !platform::MakeFolders(platform::FolderOf(path)) || !LockFile(true))
+    return false;
   if (fresh && !file_.InUseByOthers() && !file_.Resize(0)) return false;
   (void)file_.MarkInUse();  // without it two runs at once cannot both be taken back
   return !number_ || Append({{}, std::to_string(*number_)});
@@ -92,7 +94,8 @@ bool RenameLog::Intend(const RenamedFile& file) {
   } else {
     locked_ = file_.Lock();
     failed_ = !locked_;
-    if (locked_ && !file_.IsStill(DataFile(kLogName))) failed_ = !Begin(false);  // what it held was taken back
+    // what it held was taken back
+    if (locked_ && !file_.IsStill(DataFile(kLogName))) failed_ = !Begin(false);
   }
   failed_ = failed_ || !Append(file);
   if (failed_) file_.Close();

@@ -13,13 +13,14 @@ namespace fotomill {
 namespace {
 
 // A thumbnail may be encoded anew where its pixels cannot be turned as they are.
-Status TurnThumbnail(std::span<const uint8_t> bytes, Orientation orientation, const EncodeOptions& encode,
-                     std::vector<uint8_t>& made) {
+Status TurnThumbnail(std::span<const uint8_t> bytes, Orientation orientation,
+                     const EncodeOptions& encode, std::vector<uint8_t>& made) {
   TurnedJpeg turned;
   if (TurnJpeg(bytes, orientation, false, turned) == Status::Ok && !turned.file.empty()) {
     JpegHead head;
     RETURN_IF_BAD(ParseJpegHead(bytes, head));
-    return AssembleJpeg(bytes, head, {.pixels = turned.file, .swapSides = SwapsSides(orientation)}, made);
+    return AssembleJpeg(bytes, head, {.pixels = turned.file, .swapSides = SwapsSides(orientation)},
+                        made);
   }
   PicturePointer picture;
   RETURN_IF_BAD(DecodeExifThumbnail(bytes, picture));
@@ -29,27 +30,31 @@ Status TurnThumbnail(std::span<const uint8_t> bytes, Orientation orientation, co
 }
 
 // Makes a block tell of the turned picture.
-void TurnExif(std::vector<uint8_t>& exif, Orientation orientation, const TurnedJpeg& turned, const EncodeOptions& encode) {
+void TurnExif(std::vector<uint8_t>& exif, Orientation orientation, const TurnedJpeg& turned,
+              const EncodeOptions& encode) {
   if (exif.empty()) return;
   ExifFindings findings;
   std::vector<uint8_t> thumbnail;
   WalkExif(exif, nullptr, &findings);
   const Status made = TurnThumbnail(ExifThumbnail(exif, findings), orientation, encode, thumbnail);
-  if (made != Status::Ok || !ReplaceExifThumbnail(exif, thumbnail, kMostExif)) DropExifThumbnail(exif);
+  if (made != Status::Ok || !ReplaceExifThumbnail(exif, thumbnail, kMostExif))
+    DropExifThumbnail(exif);
   SetExifPictureFacts(exif, {.width = turned.width, .height = turned.height, .orientation = 1});
 }
 
 // A JPEG file in the making.
 class TurnedFile {
  public:
-  TurnedFile(std::span<const uint8_t> file, const JpegTurnRequest& request) : file_(file), request_(request) {}
+  TurnedFile(std::span<const uint8_t> file, const JpegTurnRequest& request)
+      : file_(file), request_(request) {}
 
   Status Make(std::vector<uint8_t>& made, JpegTurnResult& result) {
     RETURN_IF_BAD(ParseJpegHead(file_, head_));
     exif_.assign(head_.Exif().begin(), head_.Exif().end());
     xmp_.assign(head_.Xmp().begin(), head_.Xmp().end());
     const auto told = static_cast<Orientation>(ExifOrientation(exif_));
-    const Orientation wanted = Composed(request_.seenByExif ? told : Orientation::Upright, request_.turn);
+    const Orientation wanted =
+        Composed(request_.seenByExif ? told : Orientation::Upright, request_.turn);
     TurnedJpeg turned;
     if (wanted != Orientation::Upright) RETURN_IF_BAD(TurnPixels(wanted, turned));
     result.obstacle = turned.obstacle;
@@ -65,7 +70,8 @@ class TurnedFile {
  private:
   Status TurnPixels(Orientation wanted, TurnedJpeg& turned) const {
     if (head_.HasMorePictures()) {
-      turned.obstacle = TrRecorded("The file has embedded pictures that depend on its orientation.");
+      turned.obstacle =
+          TrRecorded("The file has embedded pictures that depend on its orientation.");
     } else if (head_.HasSplitExif()) {
       turned.obstacle = TrRecorded("The EXIF block is too large for one segment.");
     } else {
@@ -98,8 +104,8 @@ class TurnedFile {
 
 }  // namespace
 
-Status MakeTurnedJpeg(std::span<const uint8_t> file, const JpegTurnRequest& request, std::vector<uint8_t>& made,
-                      JpegTurnResult& result) {
+Status MakeTurnedJpeg(std::span<const uint8_t> file, const JpegTurnRequest& request,
+                      std::vector<uint8_t>& made, JpegTurnResult& result) {
   made.clear();
   result = {};
   return TurnedFile(file, request).Make(made, result);

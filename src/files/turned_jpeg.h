@@ -15,9 +15,11 @@ namespace fotomill {
 // How the picture is to be turned.
 struct JpegTurnRequest {
   Orientation turn = Orientation::Upright;  // of the picture as it is seen
-  bool seenByExif = true;                   // it is seen as its EXIF orientation says; otherwise as its pixels are stored
+  // it is seen as its EXIF orientation says; otherwise as its pixels are stored
+  bool seenByExif = true;
   bool trim = false;                        // cut off edges that cannot be turned without loss
-  EncodeOptions encode = {};                // of the thumbnail inside, where that cannot be turned without loss
+  // of the thumbnail inside, where that cannot be turned without loss
+  EncodeOptions encode = {};
 };
 
 // How a JPEG file was turned.
@@ -33,11 +35,12 @@ struct JpegTurnResult {
   RecordedText obstacle;  // why the pixels were not turned, as a sentence
 };
 
-// Makes the file of a turned JPEG picture; no pixel gets another value. Where the pixels cannot be turned, the orientation is set
-// instead, so that nothing is lost. EXIF, XMP and all other segments stay, as do bytes behind the picture; sizes and thumbnail in
-// the EXIF block are turned with the pixels. `made` is empty for Nothing. Statuses: those of reading; UnsuitableImage (13) where
+// Makes the file of a turned JPEG picture; no pixel gets another value. Where the pixels cannot be
+// turned, the orientation is set instead, so that nothing is lost. EXIF, XMP and all other segments
+// stay, as do bytes behind the picture; sizes and thumbnail in the EXIF block are turned with the
+// pixels. `made` is empty for Nothing. Statuses: those of reading; UnsuitableImage (13) where
 // neither pixels nor orientation can be changed, with the obstacle.
-Status MakeTurnedJpeg(std::span<const uint8_t> file, const JpegTurnRequest& request, std::vector<uint8_t>& made,
-                      JpegTurnResult& result);
+Status MakeTurnedJpeg(std::span<const uint8_t> file, const JpegTurnRequest& request,
+                      std::vector<uint8_t>& made, JpegTurnResult& result);
 
 }  // namespace fotomill

@@ -41,22 +41,27 @@ inline constexpr uint32_t FMT_MIDI = 0x100000;  // music as notes
 inline constexpr uint32_t FMT_SPARE = 0x200000;  // free slot for a plug-in format
 inline constexpr uint32_t FMT_FLASH = 0x400000;
 inline constexpr uint32_t FMT_ARCHIVE = 0x800000;  // an archive of files
-inline constexpr uint32_t FMT_SAVE_ANYWAY = 0x1000000;  // in the destination list whatever else is set
+// in the destination list whatever else is set
+inline constexpr uint32_t FMT_SAVE_ANYWAY = 0x1000000;
 inline constexpr uint32_t FMT_ALPHA = 0x2000000;        // stores an alpha channel
 
 // Operations of a row. Codecs implement them as plain functions; none of them knows the registry.
-using DetailsOperation = Status (*)(PictureRecord& picture);  // fills `detailLines` of a record that `info` has filled
+// fills `detailLines` of a record that `info` has filled
+using DetailsOperation = Status (*)(PictureRecord& picture);
 // Fills the facts; no pixel is decoded, unless the row is rendered.
 using InfoOperation = Status (*)(PictureRecord& picture, const ReadRequest& request);
 // Fills the pixels.
 using ReadOperation = Status (*)(PictureRecord& picture, const ReadRequest& request);
-using WriteOperation = Status (*)(PictureRecord& picture, const WriteOptions& options);  // to picture.fileName
-using AnimateOperation = Status (*)(const ReadRequest& request, AnimationPointer& animation);  // opens a file's frames
+// to picture.fileName
+using WriteOperation = Status (*)(PictureRecord& picture, const WriteOptions& options);
+// opens a file's frames
+using AnimateOperation = Status (*)(const ReadRequest& request, AnimationPointer& animation);
 using LifeOperation = int32_t (*)();  // once for each run of the program
 // Modal over the parent window.
 using OptionsOperation = int32_t (*)(void* parentWindow, int32_t parameter);
 
-// What files of a format begin with: one text, and where that says too little a second one further on.
+// What files of a format begin with: one text, and where that says too little a second one further
+// on.
 struct Signature {
   size_t offset = 0;
   std::string_view bytes = {};
@@ -72,7 +77,8 @@ struct FormatSetting {
   const char* label = "";     // of its control in Setup; empty for a key that Setup shows elsewhere
 };
 
-// The settings of a codec. Setup shows those with a label under one heading; the format's own box shows all.
+// The settings of a codec. Setup shows those with a label under one heading; the format's own box
+// shows all.
 struct FormatSettings {
   const char* extension;  // names the format in the box's title
   const char* box;        // the box's name, "OverrideJpgBox"
@@ -93,8 +99,8 @@ inline constexpr uint8_t kAllMetadata = kLostExif | kLostXmp | kLostIcc;
 // What a row says when its files can be read but not written.
 inline constexpr std::string_view kOnlyRead = TrLater("Files of this format can only be read.");
 
-// One row of the registry: everything that the program knows about a format. A family of codecs has its rows in
-// formats/FAMILY/rows.cpp.
+// One row of the registry: everything that the program knows about a format. A family of codecs has
+// its rows in formats/FAMILY/rows.cpp.
 struct FormatEntry {
   DetailsOperation details = nullptr;
   InfoOperation info = nullptr;
@@ -114,12 +120,15 @@ struct FormatEntry {
   bool canRead = false;          // `info` and `read` do their work in this build
   bool canWrite = false;         // so does `write`
   bool canStartUp = false;       // so does `startup`
-  bool (*present)() = nullptr;   // whether what the codec loads when it is needed is on this machine; null: nothing is
+  // whether what the codec loads when it is needed is on this machine; null: nothing is
+  bool (*present)() = nullptr;
   std::string_view whyNot = {};  // why the row cannot be read or cannot be written, in one sentence
   std::span<const Signature> signatures = {};
-  uint8_t keepsMetadata = 0;                 // kLost bits: what its files can hold, and so does not get lost
+  // kLost bits: what its files can hold, and so does not get lost
+  uint8_t keepsMetadata = 0;
   bool turnsWithoutLoss = false;             // JPEG files, which are turned without being decoded
-  bool takesPassword = false;                // `write` protects files by the password of its options
+  // `write` protects files by the password of its options
+  bool takesPassword = false;
   bool hasOptionsBox = false;                // the row gets `options`
   const FormatSettings* settings = nullptr;  // shared by the rows of one codec; null: none
   std::span<const FormatLibrary> libraries = {};

@@ -30,8 +30,8 @@ bool TakeComma(std::string_view& text) {
 }
 
 bool TakeAngle(std::string_view& text, GpsAngle& angle) {
-  if (!TakeNumber(text, angle.degrees) || !TakeComma(text) || !TakeNumber(text, angle.minutes) || !TakeComma(text) ||
-      !TakeNumber(text, angle.seconds) || !TakeComma(text) || text.empty()) {
+  if (!TakeNumber(text, angle.degrees) || !TakeComma(text) || !TakeNumber(text, angle.minutes) ||
+      !TakeComma(text) || !TakeNumber(text, angle.seconds) || !TakeComma(text) || text.empty()) {
     return false;
   }
   angle.hemisphere = text.front();
@@ -44,7 +44,8 @@ bool TakeAngle(std::string_view& text, GpsAngle& angle) {
 bool ParseGpsLocation(std::string_view text, GpsLocation& location) {
   location = {};
   GpsLocation parsed;
-  if (!TakeAngle(text, parsed.latitude) || !TakeComma(text) || !TakeAngle(text, parsed.longitude)) return false;
+  if (!TakeAngle(text, parsed.latitude) || !TakeComma(text) || !TakeAngle(text, parsed.longitude))
+    return false;
   location = parsed;
   return true;
 }
@@ -55,17 +56,22 @@ double GpsDegrees(const GpsAngle& angle) {
   return sign * (angle.degrees + angle.minutes / 60.0 + angle.seconds / 3600.0);
 }
 
-double GpsDistance(double latitude1, double longitude1, double latitude2, double longitude2, choice::DistanceUnit unit) {
+double GpsDistance(double latitude1, double longitude1, double latitude2, double longitude2,
+                   choice::DistanceUnit unit) {
   constexpr double kRadians = std::numbers::pi / 180;
   const double radius = unit == choice::kMiles ? 3956 : 6367;
   const double alongLatitude = std::sin((latitude2 - latitude1) * kRadians / 2);
   const double alongLongitude = std::sin((longitude2 - longitude1) * kRadians / 2);
-  const double a = alongLatitude * alongLatitude +
-                   std::cos(latitude1 * kRadians) * std::cos(latitude2 * kRadians) * alongLongitude * alongLongitude;
-  const double part = std::clamp(a, 0.0, 1.0);  // rounding may leave the range where the places are opposite
+  const double a = alongLatitude * alongLatitude + std::cos(latitude1 * kRadians) *
+                                                       std::cos(latitude2 * kRadians) *
+                                                       alongLongitude * alongLongitude;
+  // rounding may leave the range where the places are opposite
+  const double part = std::clamp(a, 0.0, 1.0);
   return radius * 2 * std::atan2(std::sqrt(part), std::sqrt(1 - part));
 }
 
-std::string_view DistanceUnitName(choice::DistanceUnit unit) { return unit == choice::kMiles ? TrLater("miles") : TrLater("kilometers"); }
+std::string_view DistanceUnitName(choice::DistanceUnit unit) {
+  return unit == choice::kMiles ? TrLater("miles") : TrLater("kilometers");
+}
 
 }  // namespace fotomill

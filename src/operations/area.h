@@ -7,9 +7,10 @@
 
 namespace fotomill {
 
-// The rectangle that a parameter of that kind means within a picture of size `whole`, in whole pixels. One with a place may be
-// outside; a size or a ratio is placed by gravity and lies within.
-Rectangle AreaOf(const Value& area, Size whole, const PictureMetadata& metadata, Gravity gravity = Gravity::Center);
+// The rectangle that a parameter of that kind means within a picture of size `whole`, in whole
+// pixels. One with a place may be outside; a size or a ratio is placed by gravity and lies within.
+Rectangle AreaOf(const Value& area, Size whole, const PictureMetadata& metadata,
+                 Gravity gravity = Gravity::Center);
 
 // The point that a parameter of that kind means, in pixels from the top left corner.
 struct AreaPoint {

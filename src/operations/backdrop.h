@@ -6,6 +6,8 @@
 namespace fotomill {
 
 // A parameter's color as kernels take it.
-constexpr Backdrop BackdropOf(const AlphaColor& color) { return {color.blue, color.green, color.red, color.alpha}; }
+constexpr Backdrop BackdropOf(const AlphaColor& color) {
+  return {color.blue, color.green, color.red, color.alpha};
+}
 
 }  // namespace fotomill

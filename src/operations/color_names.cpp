@@ -75,7 +75,8 @@ bool ReadHex(std::string_view digits, AlphaColor& color) {
   if (digits.size() % each != 0 || (channels != 3 && channels != 4)) return false;
   uint8_t levels[4] = {0, 0, 0, 255};
   for (size_t i = 0; i < channels; ++i) {
-    levels[i] = static_cast<uint8_t>(Digit(digits[i * each]) * 16 + Digit(digits[i * each + each - 1]));
+    levels[i] =
+        static_cast<uint8_t>(Digit(digits[i * each]) * 16 + Digit(digits[i * each + each - 1]));
   }
   color = {levels[0], levels[1], levels[2], levels[3]};
   return true;
@@ -92,7 +93,8 @@ bool ReadColor(std::string_view text, AlphaColor& color) {
   }
   const auto* const found = std::ranges::lower_bound(kNamedColors, name, {}, &NamedColor::name);
   if (found == std::end(kNamedColors) || found->name != name) return false;
-  color = {static_cast<uint8_t>(found->rgb >> 16), static_cast<uint8_t>(found->rgb >> 8), static_cast<uint8_t>(found->rgb), 255};
+  color = {static_cast<uint8_t>(found->rgb >> 16), static_cast<uint8_t>(found->rgb >> 8),
+           static_cast<uint8_t>(found->rgb), 255};
   return true;
 }
 

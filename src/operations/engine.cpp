@@ -12,25 +12,30 @@ namespace fotomill {
 namespace {
 
 OperationContext ContextOf(const EngineOptions& options) {
-  return {.work = options.work, .expand = [&options](const std::string& text, const PictureRecord& picture) {
+  return {.work = options.work,
+          .expand = [&options](const std::string& text, const PictureRecord& picture) {
             return ExpandMacros(text, options.facts, picture);
           }};
 }
 
 // How many point operations stand at the start of the steps.
 size_t PointsAhead(std::span<const Step> steps) {
-  const auto end = std::ranges::find_if(steps, [](const Step& step) { return step.operation->works != Works::Point; });
+  const auto end = std::ranges::find_if(
+      steps, [](const Step& step) { return step.operation->works != Works::Point; });
   return static_cast<size_t>(end - steps.begin());
 }
 
 Status ApplyPoints(PictureRecord& picture, std::span<const Step> steps, const Work& work) {
   std::vector<PointEffect> effects(steps.size());
-  for (size_t i = 0; i < steps.size(); ++i) steps[i].operation->point(steps[i].arguments, effects[i]);
+  for (size_t i = 0; i < steps.size(); ++i)
+    steps[i].operation->point(steps[i].arguments, effects[i]);
   return ApplyPointEffects(picture, effects, work);
 }
 
-// Runs steps without a look at metadata. `part`: on a part of a picture, of whose place the context tells.
-Status Run(PictureRecord& picture, std::span<const Step> steps, OperationContext& context, bool part) {
+// Runs steps without a look at metadata. `part`: on a part of a picture, of whose place the context
+// tells.
+Status Run(PictureRecord& picture, std::span<const Step> steps, OperationContext& context,
+           bool part) {
   while (!steps.empty()) {
     if (picture.image.Empty()) return Status::EmptyImage;
     if (!context.work.GoesOn()) return Status::FunctionCancelled;
@@ -46,11 +51,14 @@ Status Run(PictureRecord& picture, std::span<const Step> steps, OperationContext
   return Status::Ok;
 }
 
-bool IsLocal(const Operation& operation) { return operation.works == Works::Point || operation.works == Works::Neighborhood; }
+bool IsLocal(const Operation& operation) {
+  return operation.works == Works::Point || operation.works == Works::Neighborhood;
+}
 
 }  // namespace
 
-Status ApplySteps(PictureRecord& picture, std::span<const Step> steps, const EngineOptions& options) {
+Status ApplySteps(PictureRecord& picture, std::span<const Step> steps,
+                  const EngineOptions& options) {
   if (picture.image.Empty()) return Status::EmptyImage;
   OperationContext context = ContextOf(options);
   RETURN_IF_BAD(Run(picture, steps, context, false));
@@ -92,8 +100,8 @@ Status CopyPicture(const PictureRecord& picture, PictureRecord& copy) {
   return Status::Ok;
 }
 
-Status ApplyStepsToArea(const PictureRecord& picture, std::span<const Step> steps, const Rectangle& area,
-                        const EngineOptions& options, PictureRecord& part) {
+Status ApplyStepsToArea(const PictureRecord& picture, std::span<const Step> steps,
+                        const Rectangle& area, const EngineOptions& options, PictureRecord& part) {
   if (picture.image.Empty()) return Status::EmptyImage;
   // The steps at the end that can be computed for a part, and how far they reach together.
   size_t local = steps.size();
@@ -114,9 +122,11 @@ Status ApplyStepsToArea(const PictureRecord& picture, std::span<const Step> step
   const Size size{source->image.Width(), source->image.Height()};
   const Rectangle wanted = Clipped(area, size.width, size.height);
   if (wanted.width == 0) return Status::EmptyImage;
-  const auto grow = static_cast<int32_t>(std::min<int64_t>(reach, std::max(size.width, size.height)));
+  const auto grow =
+      static_cast<int32_t>(std::min<int64_t>(reach, std::max(size.width, size.height)));
   const Rectangle needed =
-      Clipped({wanted.x - grow, wanted.y - grow, wanted.width + 2 * grow, wanted.height + 2 * grow}, size.width, size.height);
+      Clipped({wanted.x - grow, wanted.y - grow, wanted.width + 2 * grow, wanted.height + 2 * grow},
+              size.width, size.height);
   RETURN_IF_BAD(CutImage(source->image, needed, part.image));
   part.alpha.Free();
   if (!source->alpha.Empty()) RETURN_IF_BAD(CutImage(source->alpha, needed, part.alpha));

@@ -17,7 +17,8 @@ namespace {
 constexpr std::string_view kLetters = "FNCYDTWHPE%";
 constexpr std::string_view kEarly = "FNC%";
 
-// The macro at the start of `text`, which begins with "%": its letter, its tag, and how long it is. nullopt when it is none.
+// The macro at the start of `text`, which begins with "%": its letter, its tag, and how long it is.
+// nullopt when it is none.
 struct Macro {
   char letter;
   std::string_view tag;
@@ -27,7 +28,8 @@ std::optional<Macro> MacroAt(std::string_view text) {
   if (text.size() < 2 || kLetters.find(text[1]) == std::string_view::npos) return std::nullopt;
   if (text[1] != 'E') return Macro{text[1], {}, 2};
   const size_t end = text.find('}');
-  if (text.size() < 3 || text[2] != '{' || end == std::string_view::npos || end == 3) return std::nullopt;
+  if (text.size() < 3 || text[2] != '{' || end == std::string_view::npos || end == 3)
+    return std::nullopt;
   return Macro{'E', text.substr(3, end - 3), end + 1};
 }
 
@@ -78,14 +80,17 @@ class DateFinder : public ExifSink {
       }
     }
   }
-  std::optional<platform::LocalTime> Time() const { return rank_ < 3 ? std::optional(time_) : std::nullopt; }
+  std::optional<platform::LocalTime> Time() const {
+    return rank_ < 3 ? std::optional(time_) : std::nullopt;
+  }
 
  private:
   static bool Read(std::string_view text, platform::LocalTime& time) {
     const std::string copy(text);
-    const int fields = std::sscanf(copy.c_str(), "%4d%*1[:-]%2d%*1[:-]%2d %2d:%2d:%2d", &time.year, &time.month, &time.day,
-                                   &time.hour, &time.minute, &time.second);
-    return fields >= 3 && time.year > 0 && time.month >= 1 && time.month <= 12 && time.day >= 1 && time.day <= 31;
+    const int fields = std::sscanf(copy.c_str(), "%4d%*1[:-]%2d%*1[:-]%2d %2d:%2d:%2d", &time.year,
+                                   &time.month, &time.day, &time.hour, &time.minute, &time.second);
+    return fields >= 3 && time.year > 0 && time.month >= 1 && time.month <= 12 && time.day >= 1 &&
+           time.day <= 31;
   }
   int rank_ = 3;
   platform::LocalTime time_;
@@ -111,17 +116,20 @@ std::string Formatted(const char* format, int32_t a, int32_t b, int32_t c) {
 }
 
 std::string Expansion(const Macro& macro, const MacroFacts& facts, const PictureRecord& picture) {
-  const platform::LocalTime time =
-      macro.letter == 'Y' || macro.letter == 'D' || macro.letter == 'T' ? TimeOf(facts, picture) : platform::LocalTime{};
+  const platform::LocalTime time = macro.letter == 'Y' || macro.letter == 'D' || macro.letter == 'T'
+                                       ? TimeOf(facts, picture)
+                                       : platform::LocalTime{};
   switch (macro.letter) {
     case 'F': return std::string(platform::SplitPath(facts.fileName).base);
-    case 'N': return facts.copyrightHolder.empty() ? platform::UserFullName() : facts.copyrightHolder;
+    case 'N':
+      return facts.copyrightHolder.empty() ? platform::UserFullName() : facts.copyrightHolder;
     case 'C': return "\u00A9";
     case 'Y': return std::to_string(time.year);
     case 'D': return Formatted("%04d-%02d-%02d", time.year, time.month, time.day);
     case 'T': return Formatted("%02d:%02d:%02d", time.hour, time.minute, time.second);
     case 'W': return std::to_string(picture.image.Empty() ? picture.width : picture.image.Width());
-    case 'H': return std::to_string(picture.image.Empty() ? picture.height : picture.image.Height());
+    case 'H':
+      return std::to_string(picture.image.Empty() ? picture.height : picture.image.Height());
     case 'P': return std::to_string(picture.page + 1);
     case 'E': return TagText(macro.tag, picture);
     default: return "%";
@@ -142,11 +150,13 @@ std::string Expand(std::string_view text, const MacroFacts& facts, const Picture
 
 }  // namespace
 
-std::string ExpandMacros(std::string_view text, const MacroFacts& facts, const PictureRecord& picture) {
+std::string ExpandMacros(std::string_view text, const MacroFacts& facts,
+                         const PictureRecord& picture) {
   return Expand(text, facts, picture, [](std::string value) { return value; });
 }
 
-std::string ExpandNameMacros(std::string_view text, const MacroFacts& facts, const PictureRecord& picture) {
+std::string ExpandNameMacros(std::string_view text, const MacroFacts& facts,
+                             const PictureRecord& picture) {
   return Expand(text, facts, picture, [](std::string value) {
     std::erase_if(value, [](char c) { return static_cast<uint8_t>(c) < 0x20 || c == 0x7f; });
     for (char& c : value) {
@@ -162,8 +172,10 @@ std::string MacroProblem(std::string_view text) {
        [&](std::string_view rest) -> size_t {
          const auto macro = MacroAt(rest);
          if (!macro && problem.empty()) {
-           problem = rest.starts_with("%E") ? "needs the name of a tag in %E{Tag}"
-                                            : "has an unknown macro " + std::string(rest.substr(0, 2)) + "; %% is a percent sign";
+           problem = rest.starts_with("%E")
+                         ? "needs the name of a tag in %E{Tag}"
+                         : "has an unknown macro " + std::string(rest.substr(0, 2)) +
+                               "; %% is a percent sign";
          }
          return macro ? macro->length : 1;
        });

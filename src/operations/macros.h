@@ -12,9 +12,9 @@ namespace fotomill {
 //
 //   %F  file name without extension      %W %H  width and height in pixels
 //   %N  copyright holder                 %P     page number, from 1
-//   %C  the copyright sign               %E{Tag}  text of an EXIF tag, empty when the picture has none
-//   %Y  year of the date                 %%     a percent sign
-//   %D  date, as 2026-11-22              %T     time, as 14:05:09
+//   %C  the copyright sign               %E{Tag}  text of an EXIF tag, empty when the picture has
+//   none %Y  year of the date                 %%     a percent sign %D  date, as 2026-11-22 %T
+//   time, as 14:05:09
 //
 // Date and time are when the picture was taken, else when its file was changed.
 
@@ -26,14 +26,19 @@ struct MacroFacts {
 };
 
 // `text` with its macros expanded; unknown ones stay as they are.
-std::string ExpandMacros(std::string_view text, const MacroFacts& facts, const PictureRecord& picture);
-// The same for a file name: "/", "\" and ":" of what macros bring in become "-", control characters are left out.
-std::string ExpandNameMacros(std::string_view text, const MacroFacts& facts, const PictureRecord& picture);
+std::string ExpandMacros(std::string_view text, const MacroFacts& facts,
+                         const PictureRecord& picture);
+// The same for a file name: "/", "\" and ":" of what macros bring in become "-", control characters
+// are left out.
+std::string ExpandNameMacros(std::string_view text, const MacroFacts& facts,
+                             const PictureRecord& picture);
 
-// What is wrong with the macros of a text, as the end of a sentence: "has an unknown macro %Q". Empty when nothing is.
+// What is wrong with the macros of a text, as the end of a sentence: "has an unknown macro %Q".
+// Empty when nothing is.
 std::string MacroProblem(std::string_view text);
 
-// Whether a text can be expanded before the picture is decoded and worked on: it has no macro about the picture.
+// Whether a text can be expanded before the picture is decoded and worked on: it has no macro about
+// the picture.
 bool IsKnownEarly(std::string_view text);
 
 }  // namespace fotomill

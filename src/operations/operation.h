@@ -14,9 +14,10 @@
 
 // One row per operation: this is all that the command line, recipes, dialogs and tests know of it.
 //
-// Kernels, the functions that compute pixels, are in src/processing (and src/drawing), take plain numbers and know nothing
-// of this table. The rows are in this room, one file a family (families/*.cpp), because a family may need more than pixels:
-// fonts, another picture, EXIF. Each file ends with one function that hands out its rows; operations.cpp joins them.
+// Kernels, the functions that compute pixels, are in src/processing (and src/drawing), take plain
+// numbers and know nothing of this table. The rows are in this room, one file a family
+// (families/*.cpp), because a family may need more than pixels: fonts, another picture, EXIF. Each
+// file ends with one function that hands out its rows; operations.cpp joins them.
 // docs/processing.md shows how to add an operation.
 namespace fotomill {
 
@@ -32,16 +33,19 @@ enum class Works : uint8_t {
   Neighborhood,  // each pixel depends on those within `reach`; the size stays
   WholePicture,  // anything else
 };
-std::string_view WorksName(Works works);  // "point", "palette", "geometry", "neighborhood", "whole picture"
+// "point", "palette", "geometry", "neighborhood", "whole picture"
+std::string_view WorksName(Works works);
 
 // What texts of a step may say about the picture: expands macros. The engine sets it.
-using TextExpander = std::function<std::string(const std::string& text, const PictureRecord& picture)>;
+using TextExpander =
+    std::function<std::string(const std::string& text, const PictureRecord& picture)>;
 
 // What surrounds one call.
 struct OperationContext {
   Work work;
-  // A preview computes only part of a picture: the place of the record's pixel (0, 0) in the whole picture and the whole's
-  // size. Operations whose result depends on the position add these. `whole` is the record's own size otherwise.
+  // A preview computes only part of a picture: the place of the record's pixel (0, 0) in the whole
+  // picture and the whole's size. Operations whose result depends on the position add these.
+  // `whole` is the record's own size otherwise.
   int32_t left = 0, top = 0;
   Size whole{0, 0};
   TextExpander expand = {};  // empty: texts are taken as they are
@@ -52,16 +56,18 @@ struct OperationContext {
   }
 };
 
-// Changes the picture in place: `image`, `alpha`, `palette`, `width`, `height` and `bitsPerPixel` stay consistent. On failure
-// the picture is whole, but may have been promoted. Metadata is the engine's. EmptyImage (31) when nothing is left of the
-// picture or there is none, MemoryAllocationError (6) when the result cannot be held, FunctionCancelled (4) when stopped.
-using ApplyFunction = Status (*)(PictureRecord& picture, const Arguments& arguments, const OperationContext& context);
+// Changes the picture in place: `image`, `alpha`, `palette`, `width`, `height` and `bitsPerPixel`
+// stay consistent. On failure the picture is whole, but may have been promoted. Metadata is the
+// engine's. EmptyImage (31) when nothing is left of the picture or there is none,
+// MemoryAllocationError (6) when the result cannot be held, FunctionCancelled (4) when stopped.
+using ApplyFunction = Status (*)(PictureRecord& picture, const Arguments& arguments,
+                                 const OperationContext& context);
 // Fills in the effect of a point operation.
 using PointFunction = void (*)(const Arguments& arguments, PointEffect& effect);
 // How many pixels around a pixel count for it, at most.
 using ReachFunction = int32_t (*)(const Arguments& arguments);
-// What is wrong with the arguments together, once each of them is right: a sentence without the operation's name, and the
-// parameter that it is about; empty when nothing is.
+// What is wrong with the arguments together, once each of them is right: a sentence without the
+// operation's name, and the parameter that it is about; empty when nothing is.
 struct ArgumentProblem {
   std::string parameter, message;
 };

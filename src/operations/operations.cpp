@@ -15,12 +15,14 @@ constexpr std::span<const Operation> (*kFamilies[])() = {
 }  // namespace
 
 std::string_view FamilyName(Family family) {
-  constexpr std::string_view kNames[] = {"crop", "transform", "effects", "filter", "annotate", "watermark", "matt"};
+  constexpr std::string_view kNames[] = {"crop",     "transform", "effects", "filter",
+                                         "annotate", "watermark", "matt"};
   return kNames[static_cast<size_t>(family)];
 }
 
 std::string_view WorksName(Works works) {
-  constexpr std::string_view kNames[] = {"point", "palette", "geometry", "neighborhood", "whole picture"};
+  constexpr std::string_view kNames[] = {"point", "palette", "geometry", "neighborhood",
+                                         "whole picture"};
   return kNames[static_cast<size_t>(works)];
 }
 

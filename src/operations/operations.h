@@ -17,9 +17,11 @@ const Operation* FindOperation(std::string_view name);
 std::span<const Operation> CropOperations();
 std::span<const Operation> TransformOperations();  // rotate, flip, resize and the like
 std::span<const Operation> EffectOperations();  // change colors point by point
-std::span<const Operation> PaletteOperations();  // of the family effects, the ones that choose new colors
+// of the family effects, the ones that choose new colors
+std::span<const Operation> PaletteOperations();
 std::span<const Operation> FilterOperations();  // look at neighboring pixels
-std::span<const Operation> DistortOperations();  // of the family filter, the ones that bend and scatter
+// of the family filter, the ones that bend and scatter
+std::span<const Operation> DistortOperations();
 std::span<const Operation> AnnotateOperations();  // text
 std::span<const Operation> WatermarkOperations();  // a second picture on top
 std::span<const Operation> MattOperations();  // frames and borders

@@ -30,9 +30,11 @@ constexpr UnitName kUnits[] = {{"px", LengthUnit::Pixels},
 std::optional<double> TakeDecimal(std::string_view& text) {
   std::string_view rest = text;
   if (rest.starts_with('+')) rest.remove_prefix(1);
-  if (rest.empty() || (rest[0] != '-' && rest[0] != '.' && (rest[0] < '0' || rest[0] > '9'))) return std::nullopt;
+  if (rest.empty() || (rest[0] != '-' && rest[0] != '.' && (rest[0] < '0' || rest[0] > '9')))
+    return std::nullopt;
   double number = 0;
-  const auto [end, error] = std::from_chars(rest.data(), rest.data() + rest.size(), number, std::chars_format::fixed);
+  const auto [end, error] =
+      std::from_chars(rest.data(), rest.data() + rest.size(), number, std::chars_format::fixed);
   if (error != std::errc() || !std::isfinite(number)) return std::nullopt;
   text = rest.substr(static_cast<size_t>(end - rest.data()));
   return number;
@@ -74,13 +76,18 @@ std::string OutOfLimits(const Parameter& row) {
   return "must be " + Decimal(row.least) + " to " + Decimal(row.most);
 }
 
-bool InLimits(const Parameter& row, double number) { return number >= row.least && number <= row.most; }
+bool InLimits(const Parameter& row, double number) {
+  return number >= row.least && number <= row.most;
+}
 
 std::string ReadNumber(const Parameter& row, std::string_view text, Value& value) {
   if (row.kind == ParameterKind::kPercent && text.ends_with('%')) text.remove_suffix(1);
   const auto number = WholeDecimal(text);
   const bool whole = row.kind == ParameterKind::kInteger;
-  if (!number) return whole ? "must be a whole number" : row.kind == ParameterKind::kPercent ? "must be a percentage" : "must be a number";
+  if (!number)
+    return whole                                 ? "must be a whole number"
+           : row.kind == ParameterKind::kPercent ? "must be a percentage"
+                                                 : "must be a number";
   if (!InLimits(row, *number)) return OutOfLimits(row);
   if (whole && *number != std::floor(*number)) return "must be a whole number";
   value.number = *number;
@@ -111,7 +118,8 @@ std::string ReadSize(const Parameter& row, std::string_view text, Value& value) 
 }
 
 std::string ReadPoint(const Parameter& row, std::string_view text, Value& value) {
-  if (!TakeLength(text, value.x) || !Take(text, ',') || !TakeLength(text, value.y) || !text.empty()) {
+  if (!TakeLength(text, value.x) || !Take(text, ',') || !TakeLength(text, value.y) ||
+      !text.empty()) {
     return "must be a point such as 10,20 or 50%,50%";
   }
   const std::string wrong = CheckLength(row, value.x);
@@ -119,17 +127,19 @@ std::string ReadPoint(const Parameter& row, std::string_view text, Value& value)
 }
 
 std::string ReadRectangle(const Parameter& row, std::string_view text, Value& value) {
-  constexpr const char* kForms = "must be a rectangle such as 400x300+10+20, a size such as 400x300, or a ratio such as 3:2";
+  constexpr const char* kForms =
+      "must be a rectangle such as 400x300+10+20, a size such as 400x300, or a ratio such as 3:2";
   if (!TakeLength(text, value.width)) return kForms;
   value.ratio = Take(text, ':');
   if (!value.ratio && !Take(text, 'x')) return kForms;
   if (!TakeLength(text, value.height)) return kForms;
-  if (value.width.number <= 0 || value.height.number <= 0) return "must have a width and a height above 0";
+  if (value.width.number <= 0 || value.height.number <= 0)
+    return "must have a width and a height above 0";
   if (!value.ratio && !text.empty()) {
     value.hasPlace = true;
     // "+10" and "-10": the sign belongs to the number.
-    if ((text[0] != '+' && text[0] != '-') || !TakeLength(text, value.x) || text.empty() || (text[0] != '+' && text[0] != '-') ||
-        !TakeLength(text, value.y)) {
+    if ((text[0] != '+' && text[0] != '-') || !TakeLength(text, value.x) || text.empty() ||
+        (text[0] != '+' && text[0] != '-') || !TakeLength(text, value.y)) {
       return kForms;
     }
   }
@@ -141,7 +151,8 @@ std::string ReadRectangle(const Parameter& row, std::string_view text, Value& va
 }
 
 std::string ReadCurve(std::string_view text, Value& value) {
-  constexpr const char* kForms = "must be two or more points such as \"0,0 64,80 255,255\", from left to right";
+  constexpr const char* kForms =
+      "must be two or more points such as \"0,0 64,80 255,255\", from left to right";
   while (!text.empty()) {
     if (Take(text, ' ')) continue;
     const auto x = TakeDecimal(text);
@@ -196,7 +207,8 @@ std::string ReadByKind(const Parameter& row, std::string_view text, Value& value
     case ParameterKind::kSize: return ReadSize(row, text, value);
     case ParameterKind::kLength: return ReadLength(row, text, value);
     case ParameterKind::kColor:
-      return ReadColor(text, value.color) ? std::string() : "must be a color such as #ff8800, #ff880080 or orange";
+      return ReadColor(text, value.color) ? std::string()
+                                          : "must be a color such as #ff8800, #ff880080 or orange";
     case ParameterKind::kChoice: return ReadChoice(row, text, value);
     case ParameterKind::kFlag: return ReadFlag(text, value);
     case ParameterKind::kPoint: return ReadPoint(row, text, value);
@@ -206,15 +218,17 @@ std::string ReadByKind(const Parameter& row, std::string_view text, Value& value
     case ParameterKind::kFile: break;
   }
   if (text.find('\0') != std::string_view::npos) return "must not contain a zero byte";
-  const bool tooLong = row.most > 0 && row.most < 1e9 && static_cast<double>(text.size()) > row.most;
+  const bool tooLong =
+      row.most > 0 && row.most < 1e9 && static_cast<double>(text.size()) > row.most;
   return tooLong ? "must have at most " + Decimal(row.most) + " characters" : std::string();
 }
 
 }  // namespace
 
 std::string_view KindName(ParameterKind kind) {
-  constexpr std::string_view kNames[] = {"integer", "number", "percent", "angle", "size",  "length",    "color",
-                                         "choice",  "flag",   "text",    "file",  "point", "rectangle", "curve"};
+  constexpr std::string_view kNames[] = {"integer", "number", "percent",   "angle", "size",
+                                         "length",  "color",  "choice",    "flag",  "text",
+                                         "file",    "point",  "rectangle", "curve"};
   return kNames[static_cast<size_t>(kind)];
 }
 
@@ -265,7 +279,8 @@ const Value& Arguments::Of(std::string_view name) const {
 }
 
 int32_t Arguments::Pixels(std::string_view name, double whole, double dpi) const {
-  return static_cast<int32_t>(std::floor(std::clamp(Of(name).x.Pixels(whole, dpi) + 0.5, -2e9, 2e9)));
+  return static_cast<int32_t>(
+      std::floor(std::clamp(Of(name).x.Pixels(whole, dpi) + 0.5, -2e9, 2e9)));
 }
 
 }  // namespace fotomill

@@ -17,7 +17,8 @@ enum class ParameterKind : uint8_t {
   kNumber,     // 0.5
   kPercent,    // 60 or 60%
   kAngle,      // degrees, clockwise: 7.5
-  kSize,       // 800x600, 800x, x600, or one value for the longest edge: 800, 50%, 10cm. Each edge is a length
+  // 800x600, 800x, x600, or one value for the longest edge: 800, 50%, 10cm. Each edge is a length
+  kSize,
   kLength,     // pixels 12, percent 5%, or 10cm, 25mm, 4in by the picture's resolution
   kColor,      // #RRGGBB, #RRGGBBAA, #RGB or a CSS name
   kChoice,     // one of several words
@@ -35,14 +36,19 @@ std::string_view KindName(ParameterKind kind);
 struct Parameter {
   const char* name;
   ParameterKind kind;
-  const char* unit = "";                   // "px", "levels", "%", "degrees"; what plain numbers mean
-  const char* preset = nullptr;            // default, as in a recipe; "": none, and leaving it out is fine; null: must be given
-  double least = -1e9, most = 1e9;         // of numbers and of each length of a size; for texts, the most characters (0: any)
+  // "px", "levels", "%", "degrees"; what plain numbers mean
+  const char* unit = "";
+  // default, as in a recipe; "": none, and leaving it out is fine; null: must be given
+  const char* preset = nullptr;
+  // of numbers and of each length of a size; for texts, the most characters (0: any)
+  double least = -1e9, most = 1e9;
   const char* choices = "";                // words of a choice, separated by "|"
   const char* label = "";                  // in a dialog
   const char* help = "";                   // one sentence
-  const char* key = "";                    // configuration key that the default comes from; `preset` stands in where it is empty
-  const char* keyWords = "";               // choices only: the word for each number of the key from 0, separated by "|"
+  // configuration key that the default comes from; `preset` stands in where it is empty
+  const char* key = "";
+  // choices only: the word for each number of the key from 0, separated by "|"
+  const char* keyWords = "";
 };
 
 // What the number of a length counts.
@@ -51,7 +57,8 @@ enum class LengthUnit : uint8_t { Pixels, Percent, Centimeters, Millimeters, Inc
 struct Length {
   double number = 0;
   LengthUnit unit = LengthUnit::Pixels;
-  // Pixels, not rounded. `whole`: what percent are of; `dpi`: pixels per inch, 96 where the picture does not say.
+  // Pixels, not rounded. `whole`: what percent are of; `dpi`: pixels per inch, 96 where the picture
+  // does not say.
   double Pixels(double whole, double dpi) const;
 };
 
@@ -77,24 +84,26 @@ struct Value {
   Length x, y;                   // Point, and a rectangle's place; a Length's value is `x`
   Length width, height;          // Size, Rectangle. One value for the longest edge is in `width`
   bool hasWidth = false, hasHeight = false, longestEdge = false;  // Size
-  bool hasPlace = false, ratio = false;                           // Rectangle; the numbers of a ratio are width and height
+  // Rectangle; the numbers of a ratio are width and height
+  bool hasPlace = false, ratio = false;
   std::vector<CurvePoint> points;                                 // Curve
 };
 
-// Reads a value for a row from its text. Empty when it is right, else what is wrong, as the end of a sentence that begins
-// with the parameter's name: "must be 0 to 100".
+// Reads a value for a row from its text. Empty when it is right, else what is wrong, as the end of
+// a sentence that begins with the parameter's name: "must be 0 to 100".
 std::string ReadValue(const Parameter& row, std::string_view text, Value& value);
 
 // A color as people write it. False for anything else.
 bool ReadColor(std::string_view text, AlphaColor& color);
 
-// Word `index` of a list separated by "|", empty when it has none; and the place of a word, -1 when it is not in the list.
+// Word `index` of a list separated by "|", empty when it has none; and the place of a word, -1 when
+// it is not in the list.
 std::string_view WordOf(std::string_view list, int32_t index);
 // -1 when the list does not have it.
 int32_t PlaceOfWord(std::string_view list, std::string_view word);
 
-// The values of one call: one for each parameter of its operation. Asking for a name that the operation does not have is a
-// fault of the program.
+// The values of one call: one for each parameter of its operation. Asking for a name that the
+// operation does not have is a fault of the program.
 class Arguments {
  public:
   Arguments() = default;

@@ -34,7 +34,9 @@ constexpr Parameter kSave[] = {
 };
 
 bool IsName(std::string_view text) {
-  return !text.empty() && std::ranges::all_of(text, [](char c) { return IsLetter(c) || (c >= '0' && c <= '9') || c == '-' || c == '_'; });
+  return !text.empty() && std::ranges::all_of(text, [](char c) {
+    return IsLetter(c) || (c >= '0' && c <= '9') || c == '-' || c == '_';
+  });
 }
 
 // A color key's number, 0x00BBGGRR, as recipes write it.
@@ -43,7 +45,8 @@ std::string ColorText(std::string_view number) {
   if (!value) return {};
   char text[8];
   const auto color = static_cast<uint32_t>(*value);
-  std::snprintf(text, sizeof text, "#%02x%02x%02x", color & 0xff, color >> 8 & 0xff, color >> 16 & 0xff);
+  std::snprintf(text, sizeof text, "#%02x%02x%02x", color & 0xff, color >> 8 & 0xff,
+                color >> 16 & 0xff);
   return text;
 }
 
@@ -108,7 +111,8 @@ class Reader {
 
  private:
   void AddMistake(int32_t line, std::string operation, std::string parameter, std::string message) {
-    mistakes_.push_back({line, std::move(operation), std::move(parameter), Sentence(std::move(message))});
+    mistakes_.push_back(
+        {line, std::move(operation), std::move(parameter), Sentence(std::move(message))});
   }
 
   RecipeOutput& Current() { return recipe_.outputs.empty() ? unnamed_ : recipe_.outputs.back(); }
@@ -117,14 +121,16 @@ class Reader {
     const std::string& name = line.words[0].text;
     if (line.open) return AddMistake(line.number, name, {}, "has a quote that does not end");
     if (name == kOutputWord) return ReadOutput(line);
-    if (Current().hasSave) return AddMistake(line.number, name, {}, "follows \"save\", which ends an output");
+    if (Current().hasSave)
+      return AddMistake(line.number, name, {}, "follows \"save\", which ends an output");
     if (name == kSaveWord) return ReadSave(line);
     const Operation* const operation = FindOperation(name);
     if (operation == nullptr) return RefuseName(line.number, name);
     Step step{operation, Arguments(operation->parameters)};
     if (!ReadArguments(line, step.arguments)) return;
     if (operation->check != nullptr) {
-      if (const ArgumentProblem problem = operation->check(step.arguments); !problem.message.empty()) {
+      if (const ArgumentProblem problem = operation->check(step.arguments);
+          !problem.message.empty()) {
         return AddMistake(line.number, name, problem.parameter, problem.message);
       }
     }
@@ -148,9 +154,12 @@ class Reader {
     } else {
       output.name = line.words[1].text;
       if (output.name.empty() || output.name.size() > 64 || !IsPlainName(output.name)) {
-        AddMistake(line.number, word, "name", "must be a plain name, as it becomes part of file names");
+        AddMistake(line.number, word, "name",
+                   "must be a plain name, as it becomes part of file names");
       }
-      if (std::ranges::any_of(recipe_.outputs, [&](const RecipeOutput& other) { return other.name == output.name; })) {
+      if (std::ranges::any_of(recipe_.outputs, [&](const RecipeOutput& other) {
+            return other.name == output.name;
+          })) {
         AddMistake(line.number, word, "name", "is taken by another output");
       }
     }
@@ -167,11 +176,15 @@ class Reader {
     const std::string word(kSaveWord);
     if (arguments.Has("max-bytes")) {
       const auto bytes = ReadByteCount(arguments.Text("max-bytes"));
-      if (!bytes) return AddMistake(line.number, word, "max-bytes", "must be a number of bytes such as 40000, 200k or 2M");
-      if (save.quality != 0) return AddMistake(line.number, word, "max-bytes", "cannot be combined with quality");
+      if (!bytes)
+        return AddMistake(line.number, word, "max-bytes",
+                          "must be a number of bytes such as 40000, 200k or 2M");
+      if (save.quality != 0)
+        return AddMistake(line.number, word, "max-bytes", "cannot be combined with quality");
       save.mostBytes = *bytes;
     }
-    if (!IsPlainName(save.name)) return AddMistake(line.number, word, "name", "must be a plain name; dest names the folder");
+    if (!IsPlainName(save.name))
+      return AddMistake(line.number, word, "name", "must be a plain name; dest names the folder");
     Current().save = std::move(save);
     Current().hasSave = true;
   }
@@ -180,21 +193,26 @@ class Reader {
   bool ReadArguments(const RecipeLine& line, Arguments& arguments) {
     const size_t before = mistakes_.size();
     size_t next = 0;
-    for (size_t i = 1; i < line.words.size(); ++i) ReadArgument(line, line.words[i], arguments, next);
+    for (size_t i = 1; i < line.words.size(); ++i)
+      ReadArgument(line, line.words[i], arguments, next);
     FillDefaults(arguments, keys_);
     for (size_t i = 0; i < arguments.Rows().size(); ++i) {
       const Parameter& row = arguments.Rows()[i];
       const bool missing = row.preset == nullptr && !arguments.At(i).given;
-      if (missing && mistakes_.size() == before) AddMistake(line.number, line.words[0].text, row.name, "must be given");
+      if (missing && mistakes_.size() == before)
+        AddMistake(line.number, line.words[0].text, row.name, "must be given");
     }
     return mistakes_.size() == before;
   }
 
-  void ReadArgument(const RecipeLine& line, const RecipeWord& word, Arguments& arguments, size_t& next) {
+  void ReadArgument(const RecipeLine& line, const RecipeWord& word, Arguments& arguments,
+                    size_t& next) {
     const std::string& operation = line.words[0].text;
     const std::span<const Parameter> rows = arguments.Rows();
     const auto indexOf = [&](std::string_view name) {
-      return static_cast<size_t>(std::ranges::find_if(rows, [&](const Parameter& row) { return row.name == name; }) - rows.begin());
+      return static_cast<size_t>(
+          std::ranges::find_if(rows, [&](const Parameter& row) { return row.name == name; }) -
+          rows.begin());
     };
     const std::string_view text = word.text;
     const bool named = word.equals != std::string::npos && IsName(text.substr(0, word.equals));
@@ -203,20 +221,25 @@ class Reader {
     std::string_view value = named ? text.substr(word.equals + 1) : text;
     if (named && place == rows.size()) {
       const auto names = ParameterNames(rows);
-      return AddMistake(line.number, operation, name, "is not a parameter of " + operation + "." + NearestNameHint(name, names));
+      return AddMistake(line.number, operation, name,
+                        "is not a parameter of " + operation + "." + NearestNameHint(name, names));
     }
     const bool flag = !named && !word.quoted && place < rows.size() && rows[place].kind == kFlag;
     if (flag) {
       value = "yes";
     } else if (!named) {
       place = next++;
-      if (place >= rows.size()) return AddMistake(line.number, operation, word.text, "is more than the operation takes");
+      if (place >= rows.size())
+        return AddMistake(line.number, operation, word.text, "is more than the operation takes");
     }
-    if (arguments.At(place).given) return AddMistake(line.number, operation, rows[place].name, "is given twice");
+    if (arguments.At(place).given)
+      return AddMistake(line.number, operation, rows[place].name, "is given twice");
     // An empty value is that of a parameter that is not set.
-    const bool unset = value.empty() && rows[place].preset != nullptr && *rows[place].preset == '\0';
+    const bool unset =
+        value.empty() && rows[place].preset != nullptr && *rows[place].preset == '\0';
     if (unset) return;
-    if (const std::string wrong = ReadChecked(rows[place], value, arguments.At(place)); !wrong.empty()) {
+    if (const std::string wrong = ReadChecked(rows[place], value, arguments.At(place));
+        !wrong.empty()) {
       AddMistake(line.number, operation, rows[place].name, wrong);
       arguments.At(place).given = true;  // reported once
     }
@@ -260,7 +283,9 @@ std::string Mistake::Text(bool withLine) const {
   return text.append(message);
 }
 
-std::vector<Mistake> ReadRecipe(std::string_view text, const KeyValues& keys, Recipe& recipe) { return Reader(keys).Read(text, recipe); }
+std::vector<Mistake> ReadRecipe(std::string_view text, const KeyValues& keys, Recipe& recipe) {
+  return Reader(keys).Read(text, recipe);
+}
 
 std::string PrintStep(const Step& step) {
   std::string line = step.operation->name;

@@ -14,13 +14,14 @@
 //   # a comment: the first character of a line is "#"
 //   upright                                  an operation
 //   crop 3:2 gravity=center; sharpen 0.6     ";" outside quotes ends a line too
-//   output large                             what stands before the first output is common to all and done once
+//   output large                             what stands before the first output is common to all
+//   and done once
 //     resize 2048x2048
 //     save to=jpg quality=85 name="%F-large"
 //
-// A line is words separated by blanks. Quotes are those of a shell: '...' as it is, "..." with \" and \\ in it, and a
-// backslash elsewhere quotes the next character. Words without a name are the operation's parameters in order, the others
-// are name=value; a flag is given by its name alone.
+// A line is words separated by blanks. Quotes are those of a shell: '...' as it is, "..." with \"
+// and \\ in it, and a backslash elsewhere quotes the next character. Words without a name are the
+// operation's parameters in order, the others are name=value; a flag is given by its name alone.
 namespace fotomill {
 
 // One operation with its arguments.
@@ -68,19 +69,23 @@ struct Mistake {
   std::string Text(bool withLine = true) const;
 };
 
-// The value of a configuration key as its file holds it; empty for a key that does not exist. Fills defaults.
+// The value of a configuration key as its file holds it; empty for a key that does not exist. Fills
+// defaults.
 using KeyValues = std::function<std::string(std::string_view key)>;
 
 // Reads a recipe. Without mistakes, `recipe` has it; else it is left alone.
 std::vector<Mistake> ReadRecipe(std::string_view text, const KeyValues& keys, Recipe& recipe);
 
-// A recipe as text; reading it gives the same recipe. Parameters with their default values are left out.
+// A recipe as text; reading it gives the same recipe. Parameters with their default values are left
+// out.
 std::string PrintRecipe(const Recipe& recipe);
 std::string PrintStep(const Step& step);  // one step as the recipe has it
 
-// A step with every parameter at its default. Required parameters have none yet: nothing may run before they are set.
+// A step with every parameter at its default. Required parameters have none yet: nothing may run
+// before they are set.
 Step DefaultStep(const Operation& operation, const KeyValues& keys);
-// Gives a parameter of a step a value, for dialogs. Empty when done, else what is wrong, as ReadValue says.
+// Gives a parameter of a step a value, for dialogs. Empty when done, else what is wrong, as
+// ReadValue says.
 std::string SetArgument(Step& step, std::string_view parameter, std::string_view text);
 // The text of a parameter's default: that of its key, else its preset; nullopt when there is none.
 std::optional<std::string> DefaultText(const Parameter& row, const KeyValues& keys);

@@ -78,11 +78,13 @@ std::vector<NamedRecipe> ListRecipes() {
   if (const auto entries = folder.empty() ? std::nullopt : platform::ListFolder(folder)) {
     for (const platform::FolderEntry& entry : *entries) {
       if (!entry.name.ends_with(kEnding) || entry.name.size() == kEnding.size()) continue;
-      recipes.push_back({entry.name.substr(0, entry.name.size() - kEnding.size()), platform::JoinFolder(folder, entry.name)});
+      recipes.push_back({entry.name.substr(0, entry.name.size() - kEnding.size()),
+                         platform::JoinFolder(folder, entry.name)});
     }
   }
   for (const ShippedRecipe& shipped : kShipped) {
-    if (std::ranges::find(recipes, shipped.name, &NamedRecipe::name) == recipes.end()) recipes.push_back({shipped.name, {}});
+    if (std::ranges::find(recipes, shipped.name, &NamedRecipe::name) == recipes.end())
+      recipes.push_back({shipped.name, {}});
   }
   std::ranges::sort(recipes, {}, &NamedRecipe::name);
   return recipes;
@@ -90,7 +92,8 @@ std::vector<NamedRecipe> ListRecipes() {
 
 std::string FindRecipe(const std::string& nameOrFile, std::string& text, std::string& path) {
   path = nameOrFile;
-  const bool file = nameOrFile.ends_with(kEnding) || nameOrFile.find_first_of("/\\") != std::string::npos;
+  const bool file =
+      nameOrFile.ends_with(kEnding) || nameOrFile.find_first_of("/\\") != std::string::npos;
   if (file) return ReadFile(path, text);
   const std::vector<NamedRecipe> recipes = ListRecipes();
   const auto found = std::ranges::find(recipes, nameOrFile, &NamedRecipe::name);

@@ -56,7 +56,8 @@ class Splitter {
         ++at_;
         return;
       }
-      const bool escaped = escapes && c == '\\' && at_ + 1 < text_.size() && (text_[at_ + 1] == quote || text_[at_ + 1] == '\\');
+      const bool escaped = escapes && c == '\\' && at_ + 1 < text_.size() &&
+                           (text_[at_ + 1] == quote || text_[at_ + 1] == '\\');
       if (escaped) ++at_;
       if (text_[at_] == '\n') ++number_;
       word_.text += text_[at_];
@@ -94,7 +95,8 @@ std::vector<RecipeLine> SplitRecipe(std::string_view text) { return Splitter(tex
 
 std::string QuotedWord(std::string_view text) {
   constexpr std::string_view kSpecial = " \t\r\n;'\"\\=";
-  const bool plain = !text.empty() && text[0] != '#' && text.find_first_of(kSpecial) == std::string_view::npos;
+  const bool plain =
+      !text.empty() && text[0] != '#' && text.find_first_of(kSpecial) == std::string_view::npos;
   if (plain) return std::string(text);
   std::string quoted = "\"";
   for (const char c : text) {

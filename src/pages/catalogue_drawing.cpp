@@ -12,9 +12,11 @@ namespace fotomill {
 namespace {
 
 constexpr int32_t kPictureInset = 2;                     // from a cell's corner
-constexpr int32_t kFrameReach = 3;                       // the far lines lie this far behind the room's size
+// the far lines lie this far behind the room's size
+constexpr int32_t kFrameReach = 3;
 constexpr int32_t kCaptionTop = 3, kCaptionBottom = 18;  // below the room
-constexpr int32_t kPageMargin = 12;                      // around the grid of a page without a size of its own
+// around the grid of a page without a size of its own
+constexpr int32_t kPageMargin = 12;
 constexpr Color kWhite = 0xFFFFFF, kBlack = 0, kDarkGray = 0x404040, kGray = 0xA0A0A0;
 
 void FillPixels(PackedImage& page, Rectangle area, Color color) {
@@ -35,7 +37,8 @@ void DrawFrame(const CatalogueLook& look, const Rectangle& cell, PackedImage& pa
   const bool raised = look.frame == CellFrame::Raised;
   const Color flat = look.blackText ? kBlack : kGray;
   const Color light = raised ? kWhite : flat, dark = raised ? kDarkGray : flat;
-  const int32_t right = cell.x + cell.width + kFrameReach, bottom = cell.y + cell.height + kFrameReach;
+  const int32_t right = cell.x + cell.width + kFrameReach,
+                bottom = cell.y + cell.height + kFrameReach;
   const int32_t width = right - cell.x + 1, height = bottom - cell.y + 1;
   FillPixels(page, {cell.x, cell.y, width, 1}, light);
   FillPixels(page, {cell.x, cell.y, 1, height}, light);
@@ -48,7 +51,8 @@ void PutImage(const PackedImage& image, int32_t left, int32_t top, PackedImage& 
     const int32_t first = std::max(0, -left), last = std::min(image.Width(), page.Width() - left);
     if (first >= last) return;
     std::memcpy(page.Row(top + y).data() + static_cast<ptrdiff_t>(left + first) * 3,
-                image.Row(y).data() + static_cast<ptrdiff_t>(first) * 3, static_cast<size_t>(last - first) * 3);
+                image.Row(y).data() + static_cast<ptrdiff_t>(first) * 3,
+                static_cast<size_t>(last - first) * 3);
   }
 }
 
@@ -61,20 +65,25 @@ int32_t Scaled(int32_t edge, int32_t room, int32_t other) {
 }  // namespace
 
 Rectangle PageSize(const CatalogueLook& look) {
-  const int32_t width = look.columns * (look.cellWidth + kCellExtraWidth) - kCellExtraWidth + 2 * kPageMargin;
+  const int32_t width =
+      look.columns * (look.cellWidth + kCellExtraWidth) - kCellExtraWidth + 2 * kPageMargin;
   const int32_t height = look.rows * (look.cellHeight + kCellExtraHeight) + 2 * kPageMargin;
-  return {0, 0, look.pageWidth > 0 ? look.pageWidth : width, look.pageHeight > 0 ? look.pageHeight : height};
+  return {0, 0, look.pageWidth > 0 ? look.pageWidth : width,
+          look.pageHeight > 0 ? look.pageHeight : height};
 }
 
 Rectangle CellPlace(const CatalogueLook& look, int32_t index) {
   const Rectangle page = PageSize(look);
-  const int32_t width = look.cellWidth + kCellExtraWidth, height = look.cellHeight + kCellExtraHeight;
+  const int32_t width = look.cellWidth + kCellExtraWidth,
+                height = look.cellHeight + kCellExtraHeight;
   const int32_t left = (page.width - look.columns * width + kCellExtraWidth) / 2;
   const int32_t top = (page.height - look.rows * height) / 2;
-  return {left + index % look.columns * width, top + index / look.columns * height, look.cellWidth, look.cellHeight};
+  return {left + index % look.columns * width, top + index / look.columns * height, look.cellWidth,
+          look.cellHeight};
 }
 
-Rectangle PicturePlace(const CatalogueLook& look, const Rectangle& cell, int32_t width, int32_t height) {
+Rectangle PicturePlace(const CatalogueLook& look, const Rectangle& cell, int32_t width,
+                       int32_t height) {
   const bool wide = int64_t{width} * look.cellHeight >= int64_t{height} * look.cellWidth;
   Rectangle place{0, 0, look.cellWidth, look.cellHeight};
   if (wide) {
@@ -106,15 +115,16 @@ Status NewCataloguePage(const CatalogueLook& look, PackedImage& page) {
   return Status::Ok;
 }
 
-void DrawCell(const CatalogueLook& look, int32_t index, const PackedImage& image, std::string_view name, CaptionFont* font,
-              PackedImage& page) {
+void DrawCell(const CatalogueLook& look, int32_t index, const PackedImage& image,
+              std::string_view name, CaptionFont* font, PackedImage& page) {
   const Rectangle cell = CellPlace(look, index);
   DrawFrame(look, cell, page);
   PutImage(image, cell.x + kPictureInset + (cell.width - image.Width()) / 2,
            cell.y + kPictureInset + (cell.height - image.Height()) / 2, page);
   if (font == nullptr || !look.names) return;
   const int32_t below = cell.y + kPictureInset + cell.height;
-  const Rectangle band{cell.x + kPictureInset, below + kCaptionTop, cell.width, kCaptionBottom - kCaptionTop};
+  const Rectangle band{cell.x + kPictureInset, below + kCaptionTop, cell.width,
+                       kCaptionBottom - kCaptionTop};
   font->DrawCentred(page, band, font->Fitted(name, band.width), look.blackText ? kBlack : kWhite);
 }
 

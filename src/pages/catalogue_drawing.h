@@ -32,17 +32,20 @@ inline constexpr int32_t kCellExtraWidth = 12, kCellExtraHeight = 21;
 Rectangle PageSize(const CatalogueLook& look);
 // The corner of cell `index`, counted row by row, and its picture's room.
 Rectangle CellPlace(const CatalogueLook& look, int32_t index);
-// Where a picture of a size is in a cell: scaled by one percentage, centred in the room 2 pixels in from the corner.
-Rectangle PicturePlace(const CatalogueLook& look, const Rectangle& cell, int32_t width, int32_t height);
+// Where a picture of a size is in a cell: scaled by one percentage, centred in the room 2 pixels in
+// from the corner.
+Rectangle PicturePlace(const CatalogueLook& look, const Rectangle& cell, int32_t width,
+                       int32_t height);
 
 // Scales a picture to a cell's room: 24 bits, on the page's background. Statuses as ScaleFiltered.
 Status MakeCellImage(PictureRecord& picture, const CatalogueLook& look, PackedImage& image);
 
 // A page of nothing but background. Statuses as NewPackedImage.
 Status NewCataloguePage(const CatalogueLook& look, PackedImage& page);
-// Draws one cell: frame, picture and name (without folder). `font` may be null for a look without names.
-void DrawCell(const CatalogueLook& look, int32_t index, const PackedImage& image, std::string_view name, CaptionFont* font,
-              PackedImage& page);
+// Draws one cell: frame, picture and name (without folder). `font` may be null for a look without
+// names.
+void DrawCell(const CatalogueLook& look, int32_t index, const PackedImage& image,
+              std::string_view name, CaptionFont* font, PackedImage& page);
 
 // Pixels from line to line of the names' font.
 inline constexpr int32_t kCaptionHeight = 14;

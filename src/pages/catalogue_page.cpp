@@ -32,23 +32,26 @@ constexpr int32_t kPageDigits = 5;
 constexpr size_t kCellsAhead = 64;
 constexpr uint64_t kBytesAhead = uint64_t{64} << 20;
 
-// The path of the next page that nobody has. ErrorWritingFile if the numbers are used up, ErrorCreatingFile if the system
-// cannot tell.
+// The path of the next page that nobody has. ErrorWritingFile if the numbers are used up,
+// ErrorCreatingFile if the system cannot tell.
 Status NextPageName(BatchJob& job, std::string& path) {
   platform::Existence existence;
   do {
     if (++job.cataloguePage >= kLastCataloguePage) return Status::ErrorWritingFile;
     path = platform::JoinFolder(job.destinationFolder,
-                                CataloguePageName(job.naming.PrefixOf(FileFunction::Catalog), job.cataloguePage, ExtensionOfFormat(job)));
+                                CataloguePageName(job.naming.PrefixOf(FileFunction::Catalog),
+                                                  job.cataloguePage, ExtensionOfFormat(job)));
     existence = platform::ExistenceOf(path);
     if (existence == platform::Existence::Unknown) return Status::ErrorCreatingFile;
   } while (existence == platform::Existence::Yes);
   return Status::Ok;
 }
 
-Status WritePage(PictureRecord& page, const CataloguePageOptions& options, const Destination& destination, BatchJob& job) {
+Status WritePage(PictureRecord& page, const CataloguePageOptions& options,
+                 const Destination& destination, BatchJob& job) {
   if (options.dryRun) return Status::Ok;
-  if (!job.destinationFolder.empty() && !platform::MakeFolders(job.destinationFolder)) return Status::ErrorCreatingFile;
+  if (!job.destinationFolder.empty() && !platform::MakeFolders(job.destinationFolder))
+    return Status::ErrorCreatingFile;
   WriteOptions write{.encode = job.encode};
   write.existing = destination.replace ? platform::Existing::Replace : platform::Existing::Refuse;
   write.password = destination.password;
@@ -59,20 +62,27 @@ Status WritePage(PictureRecord& page, const CataloguePageOptions& options, const
 class ContactSheet {
  public:
   ContactSheet(std::span<const BatchFile> files, const ContactSheetOptions& options, BatchJob& job)
-      : files_(files), options_(options), job_(job), stop_(job.stop.Token()), cells_(files.size()) {}
+      : files_(files),
+        options_(options),
+        job_(job),
+        stop_(job.stop.Token()),
+        cells_(files.size()) {}
 
-  Status OpenFont() { return options_.look.names ? font_.Open(options_.fontName, kCaptionHeight) : Status::Ok; }
+  Status OpenFont() {
+    return options_.look.names ? font_.Open(options_.fontName, kCaptionHeight) : Status::Ok;
+  }
 
   void Run() {
     const uint32_t jobs = options_.jobs == 0 ? platform::CoreCount() : options_.jobs;
-    const uint64_t cellBytes =
-        uint64_t{3} * static_cast<uint32_t>(options_.look.cellWidth) * static_cast<uint32_t>(options_.look.cellHeight);
+    const uint64_t cellBytes = uint64_t{3} * static_cast<uint32_t>(options_.look.cellWidth) *
+                               static_cast<uint32_t>(options_.look.cellHeight);
     const uint64_t room = kBytesAhead / std::max<uint64_t>(cellBytes, 1);
-    OrderedRun run({.work = [this](size_t i) { return Work(i); },
-                    .deliver = [this](size_t i, Status status) { Deliver(i, status); },
-                    .goesOn = [this] { return !ended_ && !stop_.Asked(); },
-                    .tick = [this] { Tick(); },
-                    .ahead = std::max<size_t>(std::min<uint64_t>(room, kCellsAhead), size_t{jobs} + 1)});
+    OrderedRun run(
+        {.work = [this](size_t i) { return Work(i); },
+         .deliver = [this](size_t i, Status status) { Deliver(i, status); },
+         .goesOn = [this] { return !ended_ && !stop_.Asked(); },
+         .tick = [this] { Tick(); },
+         .ahead = std::max<size_t>(std::min<uint64_t>(room, kCellsAhead), size_t{jobs} + 1)});
     run.Run(files_.size(), jobs);
     if (ended_ || stop_.Asked()) GiveUpPage();
     EndPage();
@@ -95,13 +105,15 @@ class ContactSheet {
   }
 
   void Draw(FileOutcome& outcome, PackedImage& image) const {
-    const ReadRequest request{.fileName = outcome.source,
-                              .thumbnailSide = std::max(options_.look.cellWidth, options_.look.cellHeight),
-                              .stop = stop_,
-                              .options = job_.read};
+    const ReadRequest request{
+        .fileName = outcome.source,
+        .thumbnailSide = std::max(options_.look.cellWidth, options_.look.cellHeight),
+        .stop = stop_,
+        .options = job_.read};
     PicturePointer picture;
     outcome.status = LoadPictureInfo(request, picture);
-    if (outcome.status == Status::Ok && !options_.page.dryRun) outcome.status = DrawPicture(request, *picture, image);
+    if (outcome.status == Status::Ok && !options_.page.dryRun)
+      outcome.status = DrawPicture(request, *picture, image);
     if (outcome.status != Status::Ok) outcome.hint = OpenHint(outcome.source, outcome.status);
   }
 
@@ -127,7 +139,8 @@ class ContactSheet {
   Status PutCell(const Cell& cell) {
     if (page_ == nullptr) RETURN_IF_BAD(NewPage());
     if (!cell.image.Empty()) {
-      DrawCell(options_.look, drawn_, cell.image, platform::FileNameOf(cell.outcome.source), &font_, page_->image);
+      DrawCell(options_.look, drawn_, cell.image, platform::FileNameOf(cell.outcome.source), &font_,
+               page_->image);
     }
     ++drawn_;
     return Status::Ok;
@@ -163,7 +176,8 @@ class ContactSheet {
           if (noName) outcome.destination.clear();
         }
         if (status == Status::TooManyColors) outcome.hint = options_.reduceHint;
-        if (status == Status::ErrorCreatingFile) outcome.hint = WithReason(Tr("\"%1\" cannot be created.", path));
+        if (status == Status::ErrorCreatingFile)
+          outcome.hint = WithReason(Tr("\"%1\" cannot be created.", path));
         if (status == Status::ErrorWritingFile) outcome.hint = ReasonSentence();
       }
       ReportOutcome(job_, outcome, reported_++, static_cast<uint32_t>(files_.size()));
@@ -173,9 +187,11 @@ class ContactSheet {
     drawn_ = 0;
   }
 
-  // Of the files that waited for a page that is not written, those that failed are reported all the same.
+  // Of the files that waited for a page that is not written, those that failed are reported all the
+  // same.
   void GiveUpPage() {
-    std::erase_if(waiting_, [](const FileOutcome& outcome) { return outcome.status == Status::Ok; });
+    std::erase_if(waiting_,
+                  [](const FileOutcome& outcome) { return outcome.status == Status::Ok; });
     page_.reset();
   }
 
@@ -199,11 +215,13 @@ class ContactSheet {
 };
 
 // Writes the page under the next free number. `lostRace`: another program took that meanwhile.
-Status WriteNextPage(PictureRecord& page, const CataloguePageOptions& options, BatchJob& job, std::string& path, bool& lostRace) {
+Status WriteNextPage(PictureRecord& page, const CataloguePageOptions& options, BatchJob& job,
+                     std::string& path, bool& lostRace) {
   lostRace = false;
   const TakenTest taken = platform::ExistenceOf;
   const VariantMaker variant = [&](std::string& candidate) {
-    return MakeNumberedVariant(candidate, job.naming.firstVariant, job.naming.lastVariant, taken, job.stop.Token());
+    return MakeNumberedVariant(candidate, job.naming.firstVariant, job.naming.lastVariant, taken,
+                               job.stop.Token());
   };
   std::string name;
   const Status named = NextPageName(job, name);
@@ -212,7 +230,8 @@ Status WriteNextPage(PictureRecord& page, const CataloguePageOptions& options, B
   Destination destination;
   destination.path = name;
   if (path.size() > PathText::Capacity()) return Status::InvalidDestination;
-  const DestinationAnswer answer = MakeDestinationName(destination, name, TrLater("Catalogue page"), job, taken, variant, &page);
+  const DestinationAnswer answer =
+      MakeDestinationName(destination, name, TrLater("Catalogue page"), job, taken, variant, &page);
   if (destination.search == VariantSearch::GivenUp) return Status::InvalidDestination;
   if (destination.search == VariantSearch::Unknown) return Status::ErrorCreatingFile;
   if (destination.search == VariantSearch::AllTaken) ++job.writeAborts;
@@ -235,13 +254,15 @@ Status WriteNextPage(PictureRecord& page, const CataloguePageOptions& options, B
 
 }  // namespace
 
-std::string CataloguePageName(std::string_view prefix, uint32_t number, std::string_view extension) {
+std::string CataloguePageName(std::string_view prefix, uint32_t number,
+                              std::string_view extension) {
   std::string digits = std::to_string(number);
   if (digits.size() < kPageDigits) digits.insert(0, kPageDigits - digits.size(), '0');
   return std::string(prefix) + digits + "." + LowerCase(extension);
 }
 
-Status WriteCataloguePage(PictureRecord& page, const CataloguePageOptions& options, BatchJob& job, std::string& path) {
+Status WriteCataloguePage(PictureRecord& page, const CataloguePageOptions& options, BatchJob& job,
+                          std::string& path) {
   Status status = Status::ErrorCreatingFile;
   (void)RetryLostRaces([&] {
     bool lostRace = false;
@@ -251,7 +272,8 @@ Status WriteCataloguePage(PictureRecord& page, const CataloguePageOptions& optio
   return status;
 }
 
-Status RunContactSheet(std::span<const BatchFile> files, const ContactSheetOptions& options, BatchJob& job) {
+Status RunContactSheet(std::span<const BatchFile> files, const ContactSheetOptions& options,
+                       BatchJob& job) {
   job.extension = ExtensionOfFormat(job);
   ContactSheet sheet(files, options, job);
   RETURN_IF_BAD(sheet.OpenFont());

@@ -16,19 +16,21 @@ struct Canvas {
 // A canvas that is transparent all over. Statuses as NewPackedImage.
 Status NewCanvas(int32_t width, int32_t height, Canvas& canvas);
 
-// The frames of a file one after the other, each as it stands on the canvas after those before it. A frame costs its own
-// decoding, wherever in the file it is, and only one is held. Codecs derive from this; the file stays open as long.
+// The frames of a file one after the other, each as it stands on the canvas after those before it.
+// A frame costs its own decoding, wherever in the file it is, and only one is held. Codecs derive
+// from this; the file stays open as long.
 class Animation {
  public:
   virtual ~Animation() = default;
 
-  // How long each frame stands, in milliseconds as the file has it, and so how many there are: at least one.
+  // How long each frame stands, in milliseconds as the file has it, and so how many there are: at
+  // least one.
   const std::vector<int32_t>& Delays() const { return delays_; }
   // How often the frames are to be played, 0 for ever.
   int32_t Rounds() const { return rounds_; }
 
-  // Composes the next frame, at first the first one. NoImages (20) behind the last; any other failure is the codec's own,
-  // and no frame can be had from there on until Rewind.
+  // Composes the next frame, at first the first one. NoImages (20) behind the last; any other
+  // failure is the codec's own, and no frame can be had from there on until Rewind.
   Status Next();
   // Goes back to before the first frame.
   void Rewind();
@@ -49,9 +51,10 @@ class Animation {
 };
 using AnimationPointer = std::unique_ptr<Animation>;  // null where there is none
 
-// How long a frame is shown that asks for `delayMs`. One of 10 ms or less stands for 100 ms: old programs wrote such delays
-// knowing that no browser of their time would keep to them, and browsers have done so ever since.
-// Source: E. Lawrence, "Trivia: Animated GIF Timing", IEInternals (2010, for Internet Explorer 10 revised in 2012).
+// How long a frame is shown that asks for `delayMs`. One of 10 ms or less stands for 100 ms: old
+// programs wrote such delays knowing that no browser of their time would keep to them, and browsers
+// have done so ever since. Source: E. Lawrence, "Trivia: Animated GIF Timing", IEInternals (2010,
+// for Internet Explorer 10 revised in 2012).
 constexpr int32_t ShownDelayMs(int32_t delayMs) { return delayMs <= 10 ? 100 : delayMs; }
 
 }  // namespace fotomill

@@ -6,8 +6,9 @@
 
 namespace fotomill {
 
-// What of the settings encoding depends on. The values here are the settings' defaults; a job takes those in force once, by
-// EncodeOptionsFromSettings. Numbers may lie outside their ranges: writers clamp them.
+// What of the settings encoding depends on. The values here are the settings' defaults; a job takes
+// those in force once, by EncodeOptionsFromSettings. Numbers may lie outside their ranges: writers
+// clamp them.
 struct EncodeOptions {
   bool preserveMetadata = true;  // PreserveEXIF: EXIF, XMP and ICC go along
   int32_t resolution = 300;      // TiffResolution: dots per inch of pictures that have none
@@ -15,7 +16,8 @@ struct EncodeOptions {
   bool bmpOs2 = false;                              // WriteOS2Bitmaps
   bool gifInterlaced = false;                       // WriteGIFInterlaced
   bool gif89 = true;                                // CreateGif89
-  int32_t hdpCompression = 10;                      // HDPCompression: quantizer, 0 to 255; 0 loses nothing
+  // HDPCompression: quantizer, 0 to 255; 0 loses nothing
+  int32_t hdpCompression = 10;
   int32_t hdpBits = 0;                              // HDPWriteOptions
   int32_t iconCompression = choice::kIconPng256;    // ICOCompression
   bool iffCompressed = true;                         // CreateIffCompressed

@@ -32,7 +32,8 @@ int32_t PackedImage::PixelAt(int32_t x, int32_t y) const {
 Status CheckPackedSize(int32_t width, int32_t height, int32_t bitsPerPixel) {
   if (width < 1 || height < 1) return Status::DamagedFile;
   const int32_t bits = NormalisedDepth(bitsPerPixel);
-  const uint64_t rowBytes = RowStride(width, bits) * static_cast<uint64_t>(height);  // below 2^64: a stride is below 2^34
+  // below 2^64: a stride is below 2^34
+  const uint64_t rowBytes = RowStride(width, bits) * static_cast<uint64_t>(height);
   const uint64_t headBytes = PackedImage::kHeaderSize + (bits == 24 ? 0 : uint64_t{4} << bits);
   const bool fits = rowBytes + headBytes <= limits.packedBlockBytes && rowBytes <= UINT32_MAX;
   return fits ? Status::Ok : Status::MemoryAllocationError;
@@ -42,8 +43,8 @@ Status CheckFileMemory(uint64_t bytes) {
   return bytes <= limits.fileMemoryBytes ? Status::Ok : Status::MemoryAllocationError;
 }
 
-Status NewPackedImage(int32_t width, int32_t height, const Palette* palette, int32_t bitsPerPixel, PackedImage& image,
-                      platform::Fill fill) {
+Status NewPackedImage(int32_t width, int32_t height, const Palette* palette, int32_t bitsPerPixel,
+                      PackedImage& image, platform::Fill fill) {
   image.Free();
   RETURN_IF_BAD(CheckPackedSize(width, height, bitsPerPixel));
   PackedImage made;

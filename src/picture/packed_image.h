@@ -37,7 +37,8 @@ constexpr uint64_t RowStride(int32_t width, int32_t bits) {
 //       40    4 x colors  blue, green, red, 0
 //        .    rows         each padded to a multiple of 4 bytes; 24-bit pixels are blue, green, red
 //
-// Pixels of less than 8 bits lie in a byte from the most significant bit down. The holder owns the block.
+// Pixels of less than 8 bits lie in a byte from the most significant bit down. The holder owns the
+// block.
 class PackedImage {
  public:
   static constexpr uint64_t kHeaderSize = 40;
@@ -55,23 +56,33 @@ class PackedImage {
   // Row y counted from the top, and row r in stored order, from the bottom. `stride` bytes each.
   std::span<uint8_t> Row(int32_t y) { return StoredRow(height_ - 1 - y); }
   std::span<const uint8_t> Row(int32_t y) const { return StoredRow(height_ - 1 - y); }
-  std::span<uint8_t> StoredRow(int32_t r) { return Rows().subspan(static_cast<uint64_t>(r) * stride_, stride_); }
-  std::span<const uint8_t> StoredRow(int32_t r) const { return Rows().subspan(static_cast<uint64_t>(r) * stride_, stride_); }
+  std::span<uint8_t> StoredRow(int32_t r) {
+    return Rows().subspan(static_cast<uint64_t>(r) * stride_, stride_);
+  }
+  std::span<const uint8_t> StoredRow(int32_t r) const {
+    return Rows().subspan(static_cast<uint64_t>(r) * stride_, stride_);
+  }
   // All rows in stored order.
   std::span<uint8_t> Rows() { return block_.Bytes().subspan(RowsOffset()); }
   std::span<const uint8_t> Rows() const { return block_.Bytes().subspan(RowsOffset()); }
   // The whole block, as laid out above.
   std::span<const uint8_t> Bytes() const { return block_.Bytes(); }
   // The color table: Colors() entries of blue, green, red, 0.
-  std::span<uint8_t> ColorTable() { return block_.Bytes().subspan(kHeaderSize, RowsOffset() - kHeaderSize); }
+  std::span<uint8_t> ColorTable() {
+    return block_.Bytes().subspan(kHeaderSize, RowsOffset() - kHeaderSize);
+  }
   // Blue, green, red, 0 for each color.
-  std::span<const uint8_t> ColorTable() const { return block_.Bytes().subspan(kHeaderSize, RowsOffset() - kHeaderSize); }
+  std::span<const uint8_t> ColorTable() const {
+    return block_.Bytes().subspan(kHeaderSize, RowsOffset() - kHeaderSize);
+  }
 
-  // The value at column x, row y from the top: an index, or 0x00RRGGBB of a 24-bit picture; -1 outside the picture.
+  // The value at column x, row y from the top: an index, or 0x00RRGGBB of a 24-bit picture; -1
+  // outside the picture.
   int32_t PixelAt(int32_t x, int32_t y) const;
 
  private:
-  friend Status NewPackedImage(int32_t, int32_t, const Palette*, int32_t, PackedImage&, platform::Fill);
+  friend Status NewPackedImage(int32_t, int32_t, const Palette*, int32_t, PackedImage&,
+                               platform::Fill);
   uint64_t RowsOffset() const { return kHeaderSize + 4 * static_cast<uint64_t>(Colors()); }
 
   platform::MemoryBlock block_;
@@ -79,27 +90,30 @@ class PackedImage {
   uint64_t stride_ = 0;
 };
 
-// Whether a picture of that size can be held at all, without taking memory: Ok, DamagedFile when width or height is below
-// 1, MemoryAllocationError when its block would exceed the limit.
+// Whether a picture of that size can be held at all, without taking memory: Ok, DamagedFile when
+// width or height is below 1, MemoryAllocationError when its block would exceed the limit.
 Status CheckPackedSize(int32_t width, int32_t height, int32_t bitsPerPixel);
 
 // Bytes of the rows of such a picture, without its head.
 constexpr uint64_t PackedRowBytes(int32_t width, int32_t height, int32_t bitsPerPixel) {
   return RowStride(width, NormalisedDepth(bitsPerPixel)) * static_cast<uint64_t>(height);
 }
-// Whether one file may take so many bytes for all that is held at a time: MemoryAllocationError (6) when not. Codecs ask with
-// what the header promises, their library's memory included, before they take any of it.
+// Whether one file may take so many bytes for all that is held at a time: MemoryAllocationError (6)
+// when not. Codecs ask with what the header promises, their library's memory included, before they
+// take any of it.
 Status CheckFileMemory(uint64_t bytes);
 
-// Makes the packed block of a picture at the normalised depth of `bitsPerPixel`, with its color table taken from
-// `palette` (zero without one) and its rows zero; with Fill::Unset the rows hold anything, for callers that write every
-// byte of them, padding included. DamagedFile when width or height is below 1, MemoryAllocationError when the block would
-// exceed the limit or cannot be had; `image` is empty then.
-Status NewPackedImage(int32_t width, int32_t height, const Palette* palette, int32_t bitsPerPixel, PackedImage& image,
-                      platform::Fill fill = platform::Fill::Zero);
+// Makes the packed block of a picture at the normalised depth of `bitsPerPixel`, with its color
+// table taken from `palette` (zero without one) and its rows zero; with Fill::Unset the rows hold
+// anything, for callers that write every byte of them, padding included. DamagedFile when width or
+// height is below 1, MemoryAllocationError when the block would exceed the limit or cannot be had;
+// `image` is empty then.
+Status NewPackedImage(int32_t width, int32_t height, const Palette* palette, int32_t bitsPerPixel,
+                      PackedImage& image, platform::Fill fill = platform::Fill::Zero);
 
-// An 8-bit image of the same size as a picture, with the gray ramp as its palette: the form of an alpha plane, whose
-// values run from 0, transparent, to 255. Statuses as NewPackedImage.
-Status NewAlphaPlane(int32_t width, int32_t height, PackedImage& plane, platform::Fill fill = platform::Fill::Zero);
+// An 8-bit image of the same size as a picture, with the gray ramp as its palette: the form of an
+// alpha plane, whose values run from 0, transparent, to 255. Statuses as NewPackedImage.
+Status NewAlphaPlane(int32_t width, int32_t height, PackedImage& plane,
+                     platform::Fill fill = platform::Fill::Zero);
 
 }  // namespace fotomill

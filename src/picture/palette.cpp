@@ -30,7 +30,8 @@ class PaletteFiller {
     for (const Rgb& color : colors) Add(color);
   }
   // Every combination of the levels; the first channel changes slowest.
-  void AddCube(std::span<const uint8_t> reds, std::span<const uint8_t> greens, std::span<const uint8_t> blues) {
+  void AddCube(std::span<const uint8_t> reds, std::span<const uint8_t> greens,
+               std::span<const uint8_t> blues) {
     for (const uint8_t red : reds) {
       for (const uint8_t green : greens) {
         for (const uint8_t blue : blues) Add({red, green, blue});
@@ -50,13 +51,15 @@ constexpr uint8_t kFourSteps[] = {0, 0x55, 0xaa, 0xff};
 constexpr uint8_t kSixSteps[] = {0, 0x33, 0x66, 0x99, 0xcc, 0xff};
 constexpr uint8_t kSevenSteps[] = {0, 0x2b, 0x55, 0x80, 0xaa, 0xd5, 0xff};
 constexpr uint8_t kEightSteps[] = {0, 0x24, 0x48, 0x6c, 0x90, 0xb4, 0xd8, 0xff};
-constexpr uint8_t kTwelveSteps[] = {0, 0x17, 0x2e, 0x46, 0x5d, 0x74, 0x8b, 0xa2, 0xb9, 0xd1, 0xe8, 0xff};
+constexpr uint8_t kTwelveSteps[] = {0,    0x17, 0x2e, 0x46, 0x5d, 0x74,
+                                    0x8b, 0xa2, 0xb9, 0xd1, 0xe8, 0xff};
 
 constexpr Rgb kPrimaries[] = {{0, 0, 0},   {255, 0, 0},   {0, 255, 0},   {255, 255, 0},
                               {0, 0, 255}, {255, 0, 255}, {0, 255, 255}, {255, 255, 255}};
-constexpr Rgb kVga[] = {{0, 0, 0},       {0x80, 0, 0},       {0, 0x80, 0},       {0x80, 0x80, 0}, {0, 0, 0x80}, {0x80, 0, 0x80},
-                        {0, 0x80, 0x80}, {0x80, 0x80, 0x80}, {0xc0, 0xc0, 0xc0}, {255, 0, 0},     {0, 255, 0},  {255, 255, 0},
-                        {0, 0, 255},     {255, 0, 255},      {0, 255, 255},      {255, 255, 255}};
+constexpr Rgb kVga[] = {{0, 0, 0},          {0x80, 0, 0},    {0, 0x80, 0},    {0x80, 0x80, 0},
+                        {0, 0, 0x80},       {0x80, 0, 0x80}, {0, 0x80, 0x80}, {0x80, 0x80, 0x80},
+                        {0xc0, 0xc0, 0xc0}, {255, 0, 0},     {0, 255, 0},     {255, 255, 0},
+                        {0, 0, 255},        {255, 0, 255},   {0, 255, 255},   {255, 255, 255}};
 
 // `count` grays between black and white, neither of which is among them.
 void AddInnerGrays(PaletteFiller& filler, int32_t count) {

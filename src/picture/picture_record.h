@@ -20,7 +20,8 @@ namespace fotomill {
 inline constexpr int32_t kNoFormat = -1;
 
 // Bits of PictureRecord::alphaFlags.
-inline constexpr uint8_t kHasAlpha = 1;             // the picture has alpha; set by `info` for sources deeper than 24 bits
+// the picture has alpha; set by `info` for sources deeper than 24 bits
+inline constexpr uint8_t kHasAlpha = 1;
 inline constexpr uint8_t kFlattenOnBackground = 2;  // flatten onto the record's own background
 
 // Bits of PictureRecord::lostMetadata.
@@ -42,9 +43,11 @@ class DetailLines {
   std::vector<FixedText<kMostCharacters>> lines_;
 };
 
-// What travels with a picture beside its pixels, each block as its standard lays it out; empty when there is none.
+// What travels with a picture beside its pixels, each block as its standard lays it out; empty when
+// there is none.
 struct PictureMetadata {
-  std::vector<uint8_t> exif;  // a TIFF structure from its byte order on, without any "Exif\0\0" in front
+  // a TIFF structure from its byte order on, without any "Exif\0\0" in front
+  std::vector<uint8_t> exif;
   std::vector<uint8_t> xmp;   // an XMP packet
   std::vector<uint8_t> icc;   // an ICC profile
   double dpiX = 0, dpiY = 0;  // pixels per inch, 0 when the file does not say
@@ -52,8 +55,9 @@ struct PictureMetadata {
   bool Empty() const { return exif.empty() && xmp.empty() && icc.empty(); }
 };
 
-// The one in-memory form of a picture. `info` fills the facts, `read` the pixels; a writer or a viewer consumes both. The
-// record owns everything in it. On any failure of `read`, `image` and `alpha` stay empty.
+// The one in-memory form of a picture. `info` fills the facts, `read` the pixels; a writer or a
+// viewer consumes both. The record owns everything in it. On any failure of `read`, `image` and
+// `alpha` stay empty.
 struct PictureRecord {
   PathText fileName;               // the file being read or written
   PathText workName;               // while writing: the name that `fileName` held before
@@ -64,7 +68,8 @@ struct PictureRecord {
   platform::MemoryBlock metafile;  // the picture of a rendered format
   platform::MemoryBlock extraBlock;
   uint8_t metafileKind = 0;        // 128 or more: `metafile` is an enhanced one
-  Color defaultColour = 0xffffff;  // what alpha is flattened onto unless the record has its own background
+  // what alpha is flattened onto unless the record has its own background
+  Color defaultColour = 0xffffff;
   uint64_t fileSize = 0;           // bytes, measured by `info`
   uint64_t imageBytes = 0;         // estimate of the pixel data
   Palette palette{};
@@ -83,19 +88,24 @@ struct PictureRecord {
   PictureMetadata metadata;
   uint8_t lostMetadata = 0;            // kLost bits: what the last `write` could not keep
   std::vector<uint8_t> comment;        // the file's comment text, UTF-8
-  FixedText<80> warning;               // a fault in the file that the decoder passed over; empty when there was none
-  FixedText<80> note;                  // what the decoder remarks about a file that is whole; empty if nothing
+  // a fault in the file that the decoder passed over; empty when there was none
+  FixedText<80> warning;
+  // what the decoder remarks about a file that is whole; empty if nothing
+  FixedText<80> note;
   int32_t pageCount = 1;               // pages or frames in the file
   int32_t page = 0;                    // which of them this is, from 0
-  bool simplified = false;             // by `info`: the file holds what a new one would not, deeper samples or further inks
+  // by `info`: the file holds what a new one would not, deeper samples or further inks
+  bool simplified = false;
   int32_t hotSpotX = 0, hotSpotY = 0;  // of a cursor, pixels from the left and the top
-  int32_t reduction = 1;               // of a picture decoded smaller than it is: how many pixels along each edge one of `image`
-                                       // stands for; the last column and row may stand for fewer
+  int32_t reduction =
+      1;  // of a picture decoded smaller than it is: how many pixels along each edge one of `image`
+          // stands for; the last column and row may stand for fewer
   ProgressSink* progress = nullptr;    // of the operation in work; not owned, may be null
 
   StopToken stop;                      // of the operation in work
 
-  // Tells how many rows are done. FunctionCancelled (4) when the operation is to end: codecs return it.
+  // Tells how many rows are done. FunctionCancelled (4) when the operation is to end: codecs return
+  // it.
   Status ReportRow(int32_t done) const { return ReportRow(done, height); }
   Status ReportRow(int32_t done, int32_t total) const {
     if (progress != nullptr) progress->Step(done, total);
@@ -106,11 +116,13 @@ struct PictureRecord {
 using PicturePointer = std::unique_ptr<PictureRecord>;  // owns the record and all that is in it
 
 // A new record with its defaults set: format -1, identity `remap`. Null without memory.
-PicturePointer NewPictureRecord(Color defaultColour = 0xffffff, void* window = nullptr, void* context = nullptr);
+PicturePointer NewPictureRecord(Color defaultColour = 0xffffff, void* window = nullptr,
+                                void* context = nullptr);
 
 // The usual estimate of a picture's pixel data: ((width + 7) / 8) x bits x height.
 constexpr uint64_t EstimateImageBytes(int32_t width, int32_t height, int32_t bitsPerPixel) {
-  return (static_cast<uint64_t>(width) + 7) / 8 * static_cast<uint64_t>(bitsPerPixel) * static_cast<uint64_t>(height);
+  return (static_cast<uint64_t>(width) + 7) / 8 * static_cast<uint64_t>(bitsPerPixel) *
+         static_cast<uint64_t>(height);
 }
 
 // Begins and ends the progress of one operation on a picture.

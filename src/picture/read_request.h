@@ -8,12 +8,13 @@
 
 namespace fotomill {
 
-// What of the settings decoding depends on. The values here are the settings' defaults; a job takes those in force once, by
-// ReadOptionsFromSettings.
+// What of the settings decoding depends on. The values here are the settings' defaults; a job takes
+// those in force once, by ReadOptionsFromSettings.
 struct ReadOptions {
   bool alphaChannels = true;            // UseAlphaChannels: the fourth channel of bitmaps is alpha
   bool recognizeApng = true;            // RecognizeAPNG: the frames of a PNG file are counted
-  uint32_t alphaBackground = 0xffffff;  // AlphaBackground, 0x00BBGGRR: what the record's `defaultColour` becomes
+  // AlphaBackground, 0x00BBGGRR: what the record's `defaultColour` becomes
+  uint32_t alphaBackground = 0xffffff;
   bool operator==(const ReadOptions&) const = default;
 };
 
@@ -21,11 +22,12 @@ struct ReadOptions {
 struct ReadRequest {
   std::string fileName = {};
   int32_t page = 0;           // of files with several, from 0
-  int32_t thumbnailSide = 0;  // above 0: a decoder may deliver any smaller size that is still twice that of the largest
-                              // picture inside this square, which is what its longer edge decides; the record's `width` and
-                              // `height` keep the full size, `image` tells its own
-  bool signedOnly = false;    // of `info`: a format that knows its files by no signature answers UnsupportedFormat (8)
-                              // without opening the file
+  int32_t thumbnailSide =
+      0;  // above 0: a decoder may deliver any smaller size that is still twice that of the largest
+          // picture inside this square, which is what its longer edge decides; the record's `width`
+          // and `height` keep the full size, `image` tells its own
+  bool signedOnly = false;  // of `info`: a format that knows its files by no signature answers
+                            // UnsupportedFormat (8) without opening the file
   ProgressSink* progress = nullptr;  // not owned, may be null
   StopToken stop = {};               // asked between rows; the status is FunctionCancelled (4) then
   ReadOptions options = {};

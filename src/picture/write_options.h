@@ -12,20 +12,26 @@ namespace fotomill {
 
 // What a writer is asked for.
 struct WriteOptions {
-  EncodeOptions encode = {};                                  // as the settings were when the job began
-  platform::Existing existing = platform::Existing::Replace;  // what to do about a file of the destination's name
-  bool keepMetadata = true;            // EXIF, XMP and ICC of the record go into formats that can hold them
-  bool lossless = false;               // without any loss where the format can, whatever `encode` says
-  bool comment = false;                // the comment of the record goes into files of plug-in formats
+  // as the settings were when the job began
+  EncodeOptions encode = {};
+  // what to do about a file of the destination's name
+  platform::Existing existing = platform::Existing::Replace;
+  // EXIF, XMP and ICC of the record go into formats that can hold them
+  bool keepMetadata = true;
+  // without any loss where the format can, whatever `encode` says
+  bool lossless = false;
+  // the comment of the record goes into files of plug-in formats
+  bool comment = false;
   std::string password = {};           // for formats that can be protected; empty: none
-  std::function<bool()> makeWay = {};  // called when the new file is whole, before it gets its name; false: it never does
+  // called when the new file is whole, before it gets its name; false: it never does
+  std::function<bool()> makeWay = {};
 
   // By the call and by the settings.
   bool KeepsMetadata() const { return keepMetadata && encode.preserveMetadata; }
 };
 
-// The status that a commit's outcome means: ErrorWritingFile when a write failed, ErrorCreatingFile when the name was taken
-// meanwhile and must not be replaced.
+// The status that a commit's outcome means: ErrorWritingFile when a write failed, ErrorCreatingFile
+// when the name was taken meanwhile and must not be replaced.
 constexpr Status CommitStatus(platform::CommitResult result) {
   switch (result) {
     case platform::CommitResult::Done: return Status::Ok;
@@ -35,7 +41,8 @@ constexpr Status CommitStatus(platform::CommitResult result) {
   return Status::ErrorWritingFile;
 }
 
-// Commits a writer's file as the options say; statuses as above, and ErrorCreatingFile when no way was made for it.
+// Commits a writer's file as the options say; statuses as above, and ErrorCreatingFile when no way
+// was made for it.
 inline Status CommitOutput(ByteWriter& out, const WriteOptions& options) {
   if (options.makeWay && out.WriteRest() && !options.makeWay()) return Status::ErrorCreatingFile;
   return CommitStatus(out.Commit(options.existing));

@@ -5,9 +5,10 @@
 
 namespace fotomill::platform {
 
-// Lets tests make the n-th operation on the system fail. Every open, create, read, write, sync, rename, lock and large
-// allocation of this folder asks FaultDue() first and fails when it answers true.
-extern std::atomic<int64_t> faultCountdown;  // operations until the fault; 0 or less: none is planned
+// Lets tests make the n-th operation on the system fail. Every open, create, read, write, sync,
+// rename, lock and large allocation of this folder asks FaultDue() first and fails when it answers
+// true. operations until the fault; 0 or less: none is planned
+extern std::atomic<int64_t> faultCountdown;
 
 // Counts one operation. True for the one that is to fail, and only for that.
 inline bool FaultDue() {

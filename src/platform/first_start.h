@@ -13,19 +13,23 @@ class LaterStart {
   virtual ~LaterStart() = default;
   // What the later start was given, byte for byte.
   virtual const std::string& Message() const = 0;
-  // Lets the later start end. False when it has given up waiting: it continues by itself, and its message is to be dropped.
+  // Lets the later start end. False when it has given up waiting: it continues by itself, and its
+  // message is to be dropped.
   virtual bool Accept() = 0;
 };
 
-// Has one running program of the user stand for all those of a name: later starts hand over what they were started with. What
-// an earlier program left behind when it was killed, one that hangs, and files of other users never are in the way.
+// Has one running program of the user stand for all those of a name: later starts hand over what
+// they were started with. What an earlier program left behind when it was killed, one that hangs,
+// and files of other users never are in the way.
 class FirstStart {
  public:
   // Which of the programs of a name this one is.
   enum class Standing {
     First,       // the only one so far
     HandedOver,  // another one has taken the message
-    Alone,       // the other one did not answer in time, or the system has no place for this: this one continues by itself
+    // the other one did not answer in time, or the system has no place for this: this one continues
+    // by itself
+    Alone,
   };
 
   FirstStart();

@@ -17,9 +17,9 @@ struct FileStamp {
 };
 FileStamp StampOf(const std::string& path);
 
-// A file that is going to be replaced. While it is held, other runs of this program that want to hold it wait, and an
-// OutputFile takes its place only if it still is what it was when it was held: what another program has written
-// meanwhile stays, the commit fails and Changed() turns true.
+// A file that is going to be replaced. While it is held, other runs of this program that want to
+// hold it wait, and an OutputFile takes its place only if it still is what it was when it was held:
+// what another program has written meanwhile stays, the commit fails and Changed() turns true.
 class HeldFile {
  public:
   HeldFile() = default;
@@ -27,9 +27,9 @@ class HeldFile {
   HeldFile& operator=(const HeldFile&) = delete;
   ~HeldFile() { Release(); }
 
-  // Waits for the file's lock, then remembers the file as it is. A file that is not there, or that cannot be locked on its
-  // file system, is remembered all the same. False when another program did not give up the lock, or when this one was
-  // asked to end; the reason is kept.
+  // Waits for the file's lock, then remembers the file as it is. A file that is not there, or that
+  // cannot be locked on its file system, is remembered all the same. False when another program did
+  // not give up the lock, or when this one was asked to end; the reason is kept.
   [[nodiscard]] bool Hold(const std::string& path);
   void Release();
   bool IsHeldAs(const std::string& path) const;
@@ -38,7 +38,8 @@ class HeldFile {
   // Whether a commit found the file changed.
   bool Changed() const { return changed_; }
 
-  // For OutputFile: whether a path is held by anybody, with its stamp; and that it was found changed.
+  // For OutputFile: whether a path is held by anybody, with its stamp; and that it was found
+  // changed.
   static bool Find(const std::string& path, FileStamp& stamp);
   static void SetChanged(const std::string& path);
 

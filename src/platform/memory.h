@@ -8,11 +8,12 @@
 
 namespace fotomill::platform {
 
-// How a new block's bytes start. `Unset` is for owners that write every byte before anyone reads one.
+// How a new block's bytes start. `Unset` is for owners that write every byte before anyone reads
+// one.
 enum class Fill { Zero, Unset };
 
-// A movable block of memory that its holder owns. Large blocks come from a process-wide pool, so that a batch pays for
-// fresh pages once, and ask for huge pages.
+// A movable block of memory that its holder owns. Large blocks come from a process-wide pool, so
+// that a batch pays for fresh pages once, and ask for huge pages.
 class MemoryBlock {
  public:
   MemoryBlock() = default;
@@ -27,7 +28,8 @@ class MemoryBlock {
 
   // Replaces the block by one of `size` bytes. False, with the block empty, if there is no memory.
   [[nodiscard]] bool Allocate(uint64_t size, Fill fill = Fill::Zero);
-  // Grows or shrinks, keeping the contents up to the smaller size; new bytes are zero. False leaves the block unchanged.
+  // Grows or shrinks, keeping the contents up to the smaller size; new bytes are zero. False leaves
+  // the block unchanged.
   [[nodiscard]] bool Resize(uint64_t size);
   void Free();  // into the pool, or back to the system
 
@@ -52,8 +54,9 @@ class MemoryBlock {
   uint64_t capacity_ = 0;  // bytes really reserved: size_ rounded up to what the pool deals in
 };
 
-// From here on freed blocks below the pool's size stay with the process instead of going back to the system each time the
-// last one is freed: a batch of small pictures then pays for fresh pages once. For programs that end with their work.
+// From here on freed blocks below the pool's size stay with the process instead of going back to
+// the system each time the last one is freed: a batch of small pictures then pays for fresh pages
+// once. For programs that end with their work.
 void KeepFreedMemory();
 
 // Gives the pool's unused blocks back to the system.

@@ -5,8 +5,9 @@
 
 namespace fotomill::platform {
 
-// Memory blocks that cross the boundary to plug-in modules: movable global memory on Windows, malloc() elsewhere. A
-// handle comes from a module, or goes to one; it is never trusted to be larger than the system says it is.
+// Memory blocks that cross the boundary to plug-in modules: movable global memory on Windows,
+// malloc() elsewhere. A handle comes from a module, or goes to one; it is never trusted to be
+// larger than the system says it is.
 
 // The bytes behind a handle, empty when it cannot be locked. Valid until UnlockModuleBlock.
 std::span<uint8_t> LockModuleBlock(void* handle);

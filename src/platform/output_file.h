@@ -19,9 +19,10 @@ enum class CommitResult {
   Failed,  // a write, or giving the file its name, failed
 };
 
-// A file that appears under its name only when it is whole: bytes go to a sibling without a name, or with a temporary one
-// where the file system knows no other, which Commit turns into the file. Without a Commit the sibling goes and nothing has
-// changed, even when the program is killed. A file that takes another's place takes over its permissions.
+// A file that appears under its name only when it is whole: bytes go to a sibling without a name,
+// or with a temporary one where the file system knows no other, which Commit turns into the file.
+// Without a Commit the sibling goes and nothing has changed, even when the program is killed. A
+// file that takes another's place takes over its permissions.
 class OutputFile {
  public:
   OutputFile() = default;
@@ -29,16 +30,17 @@ class OutputFile {
   OutputFile& operator=(const OutputFile&) = delete;
   ~OutputFile() { Discard(); }
 
-  // Creates the sibling of `path`. False when the folder is missing or not writable, or when `path` is there and is not
-  // a regular file or is write-protected (a symbolic link counts as a file of its own and would be replaced, never
-  // followed).
+  // Creates the sibling of `path`. False when the folder is missing or not writable, or when `path`
+  // is there and is not a regular file or is write-protected (a symbolic link counts as a file of
+  // its own and would be replaced, never followed).
   [[nodiscard]] bool Create(const std::string& path);
   // False once any write has failed.
   bool Write(std::span<const uint8_t> bytes);
   // Overwrites bytes that were written before.
   bool WriteAt(uint64_t offset, std::span<const uint8_t> bytes);
-  // Gives the file its name. `sync` asks the system to have the contents on disk first; a file that replaces another
-  // is always synced. After anything but Done there is no new file; Commit cannot be tried again.
+  // Gives the file its name. `sync` asks the system to have the contents on disk first; a file that
+  // replaces another is always synced. After anything but Done there is no new file; Commit cannot
+  // be tried again.
   [[nodiscard]] CommitResult Commit(Existing existing, bool sync = false);
   void Discard();  // deletes what was written; the destination stays as it was
 

@@ -4,7 +4,8 @@ namespace fotomill::platform {
 
 std::string JoinPath(const PathParts& parts) {
   std::string path;
-  path.reserve(parts.drive.size() + parts.folder.size() + parts.base.size() + parts.extension.size());
+  path.reserve(parts.drive.size() + parts.folder.size() + parts.base.size() +
+               parts.extension.size());
   path.append(parts.drive).append(parts.folder).append(parts.base).append(parts.extension);
   return path;
 }

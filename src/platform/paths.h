@@ -5,7 +5,8 @@
 
 namespace fotomill::platform {
 
-// The four parts of a path; joined in this order they are the path again. Views into the text that was split.
+// The four parts of a path; joined in this order they are the path again. Views into the text that
+// was split.
 struct PathParts {
   std::string_view drive;      // "C:" on Windows, always empty elsewhere
   std::string_view folder;     // with its closing separator, or empty

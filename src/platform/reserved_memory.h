@@ -8,8 +8,8 @@
 
 namespace fotomill::platform {
 
-// Much room of which little will be used: address space whose pages the system gives, zero and a small one at a time,
-// when they are first touched, and takes back at once when the room is freed.
+// Much room of which little will be used: address space whose pages the system gives, zero and a
+// small one at a time, when they are first touched, and takes back at once when the room is freed.
 class ReservedMemory {
  public:
   ReservedMemory() = default;
@@ -18,7 +18,8 @@ class ReservedMemory {
   ReservedMemory& operator=(ReservedMemory&& other) noexcept;
   ~ReservedMemory() { Free(); }
 
-  // Replaces the room by `size` zero bytes. False, with the room unchanged, if there is no address space.
+  // Replaces the room by `size` zero bytes. False, with the room unchanged, if there is no address
+  // space.
   [[nodiscard]] bool Reserve(uint64_t size);
   void Free();  // gives the address space back
 

@@ -12,9 +12,11 @@ class SharedLibrary {
   SharedLibrary& operator=(SharedLibrary&& other) noexcept;
   ~SharedLibrary() { Unload(); }
 
-  // Loads a module by its absolute path; anything but a regular file is refused. False with `Error()` set.
+  // Loads a module by its absolute path; anything but a regular file is refused. False with
+  // `Error()` set.
   [[nodiscard]] bool Load(const std::string& absolutePath);
-  // Loads one of the system's own libraries by its bare name ("libjxr.so.0"), wherever the system keeps them.
+  // Loads one of the system's own libraries by its bare name ("libjxr.so.0"), wherever the system
+  // keeps them.
   [[nodiscard]] bool LoadSystem(const std::string& name);
   bool Loaded() const { return handle_ != nullptr; }  // after Load went well
   // An export's address, null when it has none of that name.

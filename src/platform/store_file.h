@@ -6,7 +6,8 @@
 
 namespace fotomill::platform {
 
-// A file that is read and written in place, with an exclusive lock that dies with the process: what stores are made of.
+// A file that is read and written in place, with an exclusive lock that dies with the process: what
+// stores are made of.
 class StoreFile {
  public:
   StoreFile() = default;
@@ -17,8 +18,8 @@ class StoreFile {
   enum class Mode { Read, ReadWrite, CreateNew };  // CreateNew fails when the name is taken
   // Exists: the name that CreateNew wanted is taken.
   enum class OpenResult { Done, Missing, Exists, Failed };
-  // Opens a regular file; links are followed for reading only. A link that leads nowhere is Failed, not Missing: who makes
-  // a new store where one merely could not be opened loses the old one.
+  // Opens a regular file; links are followed for reading only. A link that leads nowhere is Failed,
+  // not Missing: who makes a new store where one merely could not be opened loses the old one.
   OpenResult Open(const std::string& path, Mode mode);
   void Close();  // the lock goes with it
   bool IsOpen() const { return handle_ != -1; }  // after Open was Done
@@ -31,21 +32,25 @@ class StoreFile {
   // The file grows where it has to.
   [[nodiscard]] bool WriteAt(uint64_t offset, std::span<const uint8_t> bytes);
   // The same with bytes that are in two places, one after the other in the file.
-  [[nodiscard]] bool ReadAt(uint64_t offset, std::span<uint8_t> first, std::span<uint8_t> second) const;
-  [[nodiscard]] bool WriteAt(uint64_t offset, std::span<const uint8_t> first, std::span<const uint8_t> second);
+  [[nodiscard]] bool ReadAt(uint64_t offset, std::span<uint8_t> first,
+                            std::span<uint8_t> second) const;
+  [[nodiscard]] bool WriteAt(uint64_t offset, std::span<const uint8_t> first,
+                             std::span<const uint8_t> second);
   [[nodiscard]] bool Sync();  // what was written outlasts a power failure from here on
   // Cuts the file to that size, or makes it longer with zeros.
   [[nodiscard]] bool Resize(uint64_t size);
-  // Waits for the exclusive lock on the file, which two StoreFiles never hold together, in one process or in two. Advisory
-  // between programs that ask for it. False when it cannot be had, when the program was asked to end meanwhile, and after ten
-  // seconds; only then a reason is kept, which names the holder.
+  // Waits for the exclusive lock on the file, which two StoreFiles never hold together, in one
+  // process or in two. Advisory between programs that ask for it. False when it cannot be had, when
+  // the program was asked to end meanwhile, and after ten seconds; only then a reason is kept,
+  // which names the holder.
   [[nodiscard]] bool Lock();
   void Unlock();  // others may go on
-  // Says until Close that the file is in use, which any number of StoreFiles may; and whether others say so. Apart from Lock.
-  // Where locks do not work nothing is in use.
+  // Says until Close that the file is in use, which any number of StoreFiles may; and whether
+  // others say so. Apart from Lock. Where locks do not work nothing is in use.
   bool MarkInUse();
   bool InUseByOthers() const;
-  // Whether `path` still names this very file; after waiting for a lock another process may have replaced it.
+  // Whether `path` still names this very file; after waiting for a lock another process may have
+  // replaced it.
   bool IsStill(const std::string& path) const;
   // The same with its size and time, all in one question to the system.
   bool IsStill(const std::string& path, uint64_t& size, int64_t& modified) const;

@@ -1,10 +1,12 @@
 #pragma once
 
-// Functions for processors that have more than the build's baseline. What is between VECTOR_AVX2_BEGIN and
-// VECTOR_AVX2_END is compiled for AVX2 where the build knows it (VECTOR_HAS_AVX2 is 1), and may be called when
-// HasAvx2() says so. Nothing that the baseline uses too, such as a header of the standard library, may be included there.
+// Functions for processors that have more than the build's baseline. What is between
+// VECTOR_AVX2_BEGIN and VECTOR_AVX2_END is compiled for AVX2 where the build knows it
+// (VECTOR_HAS_AVX2 is 1), and may be called when HasAvx2() says so. Nothing that the baseline uses
+// too, such as a header of the standard library, may be included there.
 
-// In front of a loop that writes an element and reads others only further on: it may be done several elements at a time.
+// In front of a loop that writes an element and reads others only further on: it may be done
+// several elements at a time.
 #if defined(__clang__)
 #define VECTOR_READS_AHEAD _Pragma("clang loop vectorize(assume_safety)")
 #else
@@ -15,7 +17,8 @@
 #include <immintrin.h>
 #define VECTOR_HAS_AVX2 1
 #if defined(__clang__)
-#define VECTOR_AVX2_BEGIN _Pragma("clang attribute push(__attribute__((target(\"avx2\"))), apply_to = function)")
+#define VECTOR_AVX2_BEGIN \
+  _Pragma("clang attribute push(__attribute__((target(\"avx2\"))), apply_to = function)")
 #define VECTOR_AVX2_END _Pragma("clang attribute pop")
 #else
 #define VECTOR_AVX2_BEGIN _Pragma("GCC push_options") _Pragma("GCC target(\"avx2\")")

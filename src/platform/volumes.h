@@ -17,13 +17,14 @@ struct Volume {
   DriveKind kind = DriveKind::Unknown;
 };
 
-// Asks the system about the volume of a file or folder that is there, or whose folder is; any other is not available. Tests
-// put a function of their own in its place.
+// Asks the system about the volume of a file or folder that is there, or whose folder is; any other
+// is not available. Tests put a function of their own in its place.
 Volume VolumeOf(const std::string& path);
 using VolumeFunction = Volume (*)(const std::string& path);  // how tests stand in for the system
 void ReplaceVolumeFunction(VolumeFunction function);  // null restores the system's
 
-// Where volumes of the user are mounted: drives that were plugged in, discs, shares. In order, without asking the volumes.
+// Where volumes of the user are mounted: drives that were plugged in, discs, shares. In order,
+// without asking the volumes.
 std::vector<std::string> UserVolumes();
 
 // Free bytes on the volume of a path (likewise), 0 when unknown.

@@ -17,7 +17,8 @@ class SharedBlock {
 
   // False if there is no memory. Once for each block.
   [[nodiscard]] bool Allocate(uint64_t size);
-  std::span<uint8_t> Bytes() { return {data_, static_cast<size_t>(size_)}; }  // empty until Allocate
+  // empty until Allocate
+  std::span<uint8_t> Bytes() { return {data_, static_cast<size_t>(size_)}; }
   std::span<const uint8_t> Bytes() const { return {data_, static_cast<size_t>(size_)}; }
   // The system's number of the block, for the process apart.
   intptr_t SystemHandle() const { return handle_; }
@@ -43,10 +44,12 @@ struct ApartTask {
   bool (*run)(const ApartCall& call);  // the answer for the caller
 };
 
-// The first call of every program that has work done apart, before it begins a thread. In the program that the user started
-// it does nothing, and returns nothing; in a process apart, which is that program started again, it does what it is asked for
-// until nobody asks any more, and returns the exit status.
-std::optional<int> ServeApart(int count, const char* const* arguments, std::span<const ApartTask> tasks);
+// The first call of every program that has work done apart, before it begins a thread. In the
+// program that the user started it does nothing, and returns nothing; in a process apart, which is
+// that program started again, it does what it is asked for until nobody asks any more, and returns
+// the exit status.
+std::optional<int> ServeApart(int count, const char* const* arguments,
+                              std::span<const ApartTask> tasks);
 
 // How work apart ended.
 enum class ApartResult {
@@ -63,14 +66,16 @@ struct ApartOrder {
   std::span<const uint8_t> request = {};
   std::span<const uint8_t> input = {};
   SharedBlock& reply;
-  unsigned seconds = 60;              // of processor time; it also ends after ten times as many by the clock
+  // of processor time; it also ends after ten times as many by the clock
+  unsigned seconds = 60;
   uint64_t memory = uint64_t{2} << 30;  // bytes that it may take beside input and reply
   std::function<bool()> goesOn = {};  // asked several times a second
 };
 
-// Has work done that may crash, such as that of a library which trusts its input, where it can do no harm: in a process of its own
-// that sees nothing of this one but what it is given, can write no file, and ends with this one. `told` gets its numbers. A
-// process that has done well stays for the next order, until EndIdleProcesses.
+// Has work done that may crash, such as that of a library which trusts its input, where it can do
+// no harm: in a process of its own that sees nothing of this one but what it is given, can write no
+// file, and ends with this one. `told` gets its numbers. A process that has done well stays for the
+// next order, until EndIdleProcesses.
 ApartResult RunApart(const ApartOrder& order, const std::function<void(int32_t)>& told);
 
 // Ends the processes apart that have nothing to do.

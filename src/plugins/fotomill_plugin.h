@@ -1,21 +1,24 @@
 /*
  * Writing an image plug-in for Fotomill Professional.
  *
- * A plug-in is a shared library named FMWPL*.so (FMWPL*.DLL on Windows) in the folder "plugin" beside the program. It
- * serves one or more picture formats, one per file extension. This header is all it needs; it is plain C and includes
- * nothing of the program. docs/plugins.md walks through a complete example.
+ * A plug-in is a shared library named FMWPL*.so (FMWPL*.DLL on Windows) in the folder "plugin"
+ * beside the program. It serves one or more picture formats, one per file extension. This header is
+ * all it needs; it is plain C and includes nothing of the program. docs/plugins.md walks through a
+ * complete example.
  *
- * The program looks up eight functions by name. Three are required: PLUGIN11GetPluginParams, PLUGIN11GetInfo and
- * PLUGIN11ReadImage. The others may be absent.
+ * The program looks up eight functions by name. Three are required: PLUGIN11GetPluginParams,
+ * PLUGIN11GetInfo and PLUGIN11ReadImage. The others may be absent.
  *
  * Rules for every call:
- *  - Every block begins with its own size and the interface version. The program sets both; refuse a version that is
- *    lower than FMW_PLUGIN_VERSION, ignore bytes beyond the size that you know.
- *  - Blocks are packed: no padding anywhere. Where pointers have 8 bytes the pointer fields are 8 bytes wide, and the
- *    fields behind them move up by as much; the size field tells which layout it is.
+ *  - Every block begins with its own size and the interface version. The program sets both; refuse
+ * a version that is lower than FMW_PLUGIN_VERSION, ignore bytes beyond the size that you know.
+ *  - Blocks are packed: no padding anywhere. Where pointers have 8 bytes the pointer fields are 8
+ * bytes wide, and the fields behind them move up by as much; the size field tells which layout it
+ * is.
  *  - Texts are UTF-8 and end in a zero byte. File names are as the system gives them.
  *  - Calls into one module never overlap, but they may come from different threads.
- *  - A plug-in is code inside the program: when it crashes, the program does. Check what files claim.
+ *  - A plug-in is code inside the program: when it crashes, the program does. Check what files
+ * claim.
  */
 #ifndef FOTOMILL_PLUGIN_H
 #define FOTOMILL_PLUGIN_H
@@ -59,8 +62,9 @@ extern "C" {
 #define FMW_FORMAT_ALPHA 0x2000000 /* the writer stores an alpha channel */
 
 /*
- * A memory block that crosses the boundary. On Windows it is a movable global memory handle; elsewhere it is a pointer
- * from malloc(). Who receives a block as a result frees it: the program frees what ReadImage and GetComment return.
+ * A memory block that crosses the boundary. On Windows it is a movable global memory handle;
+ * elsewhere it is a pointer from malloc(). Who receives a block as a result frees it: the program
+ * frees what ReadImage and GetComment return.
  */
 typedef void* FMW_HANDLE;
 
@@ -74,16 +78,18 @@ typedef struct FMW_PLUGIN_PARAMS {
   char textA[FMW_TEXT_SIZE];      /*  12: the module's name, for the list of plug-ins */
   char extensions[FMW_TEXT_SIZE]; /* 273: without dots, separated by ";": "pgm;ppm" */
   char textB[FMW_TEXT_SIZE];      /* 534: the formats' description, shown behind "(EXT) Plugin" */
-  uint32_t flags1;                /* 795: deepest picture that the writer takes, bits per pixel: 1, 8 or 24 */
+  uint32_t flags1; /* 795: deepest picture that the writer takes, bits per pixel: 1, 8 or 24 */
   uint32_t flags2;                /* 799: FMW_FORMAT_ bits */
-  void* instance;                 /* 803: the program's module instance, 0 where there is no such thing */
+  void* instance; /* 803: the program's module instance, 0 where there is no such thing */
   uint8_t reserved2[56];          /* 807 */
 } FMW_PLUGIN_PARAMS;
 
-/* A row of the program's configuration table: 20 bytes with 4-byte pointers, 32 with 8-byte ones. */
+/* A row of the program's configuration table: 20 bytes with 4-byte pointers, 32 with 8-byte ones.
+ */
 typedef struct FMW_CONFIG_ENTRY {
   const char* name;     /* the key's name */
-  const void* variable; /* where its value is: an int32_t, or a text of at least 33 bytes; read only */
+  const void*
+      variable; /* where its value is: an int32_t, or a text of at least 33 bytes; read only */
   uint32_t type;        /* 0x1 flag, 0x2 text, 0x4 integer, 0x8 color ... */
   uint32_t control;
   const void* extra;
@@ -96,16 +102,17 @@ typedef struct FMW_HOST_SERVICES {
   int32_t zero;      /*  8 */
   char mark[4];      /* 12: "RXaR" */
   uint8_t zero2[12]; /* 16 */
-  /* Loads any picture that the program can read and returns it as a packed bitmap, or 0 with the error number set. */
+  /* Loads any picture that the program can read and returns it as a packed bitmap, or 0 with the
+   * error number set. */
   FMW_HANDLE(FMW_CALL* loadPicture)(const char* fileName, int32_t* error); /* 28 */
-  void(FMW_CALL* freePicture)(FMW_HANDLE bitmap);                          /* 32: frees what loadPicture returned */
+  void(FMW_CALL* freePicture)(FMW_HANDLE bitmap); /* 32: frees what loadPicture returned */
   void(FMW_CALL* progressBegin)(void);                                     /* 36 */
   void(FMW_CALL* progressStep)(int32_t done, int32_t total);               /* 40 */
   void(FMW_CALL* progressEnd)(void);                                       /* 44 */
-  void(FMW_CALL* setStatus)(const char* text);                             /* 48: replaces the status text */
-  const FMW_CONFIG_ENTRY* configuration;                                   /* 52: the configuration table; read only */
+  void(FMW_CALL* setStatus)(const char* text); /* 48: replaces the status text */
+  const FMW_CONFIG_ENTRY* configuration;       /* 52: the configuration table; read only */
   int32_t configurationCount;                                              /* 56: its rows */
-  const char* comment;                                                     /* 60: in read calls the record's comment text, or 0 */
+  const char* comment; /* 60: in read calls the record's comment text, or 0 */
 } FMW_HOST_SERVICES;
 
 /* Filled by PLUGIN11GetInfo. The program clears it and sets size, version and frame. */
@@ -139,26 +146,30 @@ typedef struct FMW_CONFIGURE {
 #pragma pack(pop)
 
 /*
- * A packed bitmap, as ReadImage returns and WriteImage receives it: a 40-byte BITMAPINFOHEADER (width, positive height,
- * 1 plane, 1, 4, 8, 24 or, from plug-ins, 32 bits, no compression), the color table of 2, 16 or 256 entries of blue,
- * green, red, 0 for up to 8 bits, and the rows, bottom row first, each padded to a multiple of 4 bytes. 24-bit pixels
- * are blue, green, red; 32-bit ones have an alpha byte behind them, 0 transparent.
+ * A packed bitmap, as ReadImage returns and WriteImage receives it: a 40-byte BITMAPINFOHEADER
+ * (width, positive height, 1 plane, 1, 4, 8, 24 or, from plug-ins, 32 bits, no compression), the
+ * color table of 2, 16 or 256 entries of blue, green, red, 0 for up to 8 bits, and the rows, bottom
+ * row first, each padded to a multiple of 4 bytes. 24-bit pixels are blue, green, red; 32-bit ones
+ * have an alpha byte behind them, 0 transparent.
  */
 
 /* The exports. Names are exact; results are non-zero on success unless said otherwise. */
-typedef const char*(FMW_CALL* FMW_GET_VERSION)(void);   /* PLUGIN11GetVersion: the module's own version text */
+typedef const char*(FMW_CALL* FMW_GET_VERSION)(
+    void); /* PLUGIN11GetVersion: the module's own version text */
 typedef const char*(FMW_CALL* FMW_GET_COPYRIGHT)(void); /* PLUGIN11GetCopyright */
 /* PLUGIN11GetPluginParams: what the module serves. `zero` is 0. */
 typedef int32_t(FMW_CALL* FMW_GET_PARAMS)(FMW_PLUGIN_PARAMS* params, int32_t zero);
 /* PLUGIN11ReadImage: decodes a file; a packed bitmap, or 0 with the error number set. */
-typedef FMW_HANDLE(FMW_CALL* FMW_READ_IMAGE)(const char* fileName, int32_t* error, const FMW_HOST_SERVICES* services);
-/* PLUGIN11WriteImage: writes `bitmap` (a packed bitmap that stays the program's) and the comment, when there is one, to
- * a new file. After a failure the program deletes what is there. */
-typedef int32_t(FMW_CALL* FMW_WRITE_IMAGE)(const char* fileName, FMW_HANDLE bitmap, const char* comment, int32_t* error,
+typedef FMW_HANDLE(FMW_CALL* FMW_READ_IMAGE)(const char* fileName, int32_t* error,
+                                             const FMW_HOST_SERVICES* services);
+/* PLUGIN11WriteImage: writes `bitmap` (a packed bitmap that stays the program's) and the comment,
+ * when there is one, to a new file. After a failure the program deletes what is there. */
+typedef int32_t(FMW_CALL* FMW_WRITE_IMAGE)(const char* fileName, FMW_HANDLE bitmap,
+                                           const char* comment, int32_t* error,
                                            const FMW_HOST_SERVICES* services);
 /* PLUGIN11GetInfo: reads a file's header. */
-typedef int32_t(FMW_CALL* FMW_GET_INFO)(FMW_PICTURE_INFO* info, const char* fileName, int32_t* error,
-                                        const FMW_HOST_SERVICES* services);
+typedef int32_t(FMW_CALL* FMW_GET_INFO)(FMW_PICTURE_INFO* info, const char* fileName,
+                                        int32_t* error, const FMW_HOST_SERVICES* services);
 /* PLUGIN11GetComment: the comment inside a file as a block with a zero-terminated text, or 0. */
 typedef FMW_HANDLE(FMW_CALL* FMW_GET_COMMENT)(const char* fileName, int32_t* error, int32_t zero);
 /* PLUGIN11DoConfigure: shows the plug-in's own settings; 0 when it has none. */

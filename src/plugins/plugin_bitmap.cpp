@@ -46,7 +46,8 @@ Status ParseHeader(ByteReader& bytes, BitmapHeader& header) {
   return header.bits == 24 || header.bits == 32 ? Status::Ok : Status::UnsupportedFormat;
 }
 
-void SplitAlphaRow(std::span<const uint8_t> source, std::span<uint8_t> pixels, std::span<uint8_t> alpha, int32_t width) {
+void SplitAlphaRow(std::span<const uint8_t> source, std::span<uint8_t> pixels,
+                   std::span<uint8_t> alpha, int32_t width) {
   for (size_t x = 0; x < static_cast<size_t>(width); ++x) {
     std::memcpy(&pixels[3 * x], &source[4 * x], 3);
     alpha[x] = source[4 * x + 3];
@@ -55,14 +56,16 @@ void SplitAlphaRow(std::span<const uint8_t> source, std::span<uint8_t> pixels, s
 
 }  // namespace
 
-Status TakeModuleBitmap(std::span<const uint8_t> block, PackedImage& image, PackedImage& alpha, Palette& palette) {
+Status TakeModuleBitmap(std::span<const uint8_t> block, PackedImage& image, PackedImage& alpha,
+                        Palette& palette) {
   ByteReader bytes(block);
   BitmapHeader header;
   RETURN_IF_BAD(ParseHeader(bytes, header));
   bytes.Seek(header.size);
   const auto table = bytes.Take(uint64_t{4} * header.colors);
   const uint64_t stride = RowStride(header.width, header.bits);
-  if (!bytes.Ok() || bytes.Left() / stride < static_cast<uint64_t>(header.height)) return Status::DamagedFile;
+  if (!bytes.Ok() || bytes.Left() / stride < static_cast<uint64_t>(header.height))
+    return Status::DamagedFile;
 
   palette.fill(0);
   for (size_t i = 0; i < header.colors; ++i) {
@@ -90,7 +93,8 @@ Status TakeModuleBitmap(std::span<const uint8_t> block, PackedImage& image, Pack
 void* NewModuleBitmap(const PackedImage& image, const PackedImage& alpha) {
   if (alpha.Empty() || image.Bits() != 24) return platform::NewModuleBlock(image.Bytes());
   const auto width = static_cast<size_t>(image.Width());
-  std::vector<uint8_t> block(PackedImage::kHeaderSize + 4 * width * static_cast<size_t>(image.Height()));
+  std::vector<uint8_t> block(PackedImage::kHeaderSize +
+                             4 * width * static_cast<size_t>(image.Height()));
   std::copy_n(image.Bytes().begin(), PackedImage::kHeaderSize, block.begin());
   block[14] = 32;
   const auto rowBytes = static_cast<uint32_t>(block.size() - PackedImage::kHeaderSize);

@@ -29,7 +29,8 @@ std::recursive_mutex& CallMutex() {  // recursive: a module may load pictures th
 const FMW_CONFIG_ENTRY* configuration = nullptr;
 int32_t configurationCount = 0;
 
-// The picture whose call is running on this thread; the progress entries have no argument that could tell.
+// The picture whose call is running on this thread; the progress entries have no argument that
+// could tell.
 thread_local PictureRecord* currentPicture = nullptr;
 // How it is read; pictures that the module loads meanwhile are read alike.
 thread_local const ReadOptions* currentOptions = nullptr;
@@ -38,14 +39,18 @@ ReadOptions CurrentOptions() { return currentOptions == nullptr ? ReadOptions() 
 
 FMW_HANDLE FMW_CALL HostLoadPicture(const char* fileName, int32_t* error) {
   PicturePointer picture;
-  Status status = fileName == nullptr ? Status::FileOpenError : LoadPicture({.fileName = fileName, .options = CurrentOptions()}, picture);
+  Status status = fileName == nullptr
+                      ? Status::FileOpenError
+                      : LoadPicture({.fileName = fileName, .options = CurrentOptions()}, picture);
   void* block = status == Status::Ok ? platform::NewModuleBlock(picture->image.Bytes()) : nullptr;
   if (status == Status::Ok && block == nullptr) status = Status::MemoryAllocationError;
   if (error != nullptr) *error = StatusNumber(status);
   return block;
 }
 void FMW_CALL HostFreePicture(FMW_HANDLE bitmap) { platform::FreeModuleBlock(bitmap); }
-ProgressSink* CurrentProgress() { return currentPicture == nullptr ? nullptr : currentPicture->progress; }
+ProgressSink* CurrentProgress() {
+  return currentPicture == nullptr ? nullptr : currentPicture->progress;
+}
 void FMW_CALL HostProgressBegin() {
   if (ProgressSink* progress = CurrentProgress()) progress->Begin();
 }
@@ -56,7 +61,8 @@ void FMW_CALL HostProgressEnd() {
   if (ProgressSink* progress = CurrentProgress()) progress->End();
 }
 void FMW_CALL HostSetStatus(const char* text) {
-  if (ProgressSink* progress = CurrentProgress(); progress != nullptr && text != nullptr) progress->SetText(text);
+  if (ProgressSink* progress = CurrentProgress(); progress != nullptr && text != nullptr)
+    progress->SetText(text);
 }
 
 // One call into a module: holds the mutex, names the picture, and carries the service block.
@@ -93,14 +99,20 @@ class ModuleCall {
   FMW_HOST_SERVICES services_ = {};
 };
 
-// A module's error number as a status. A module that fails without a number has at least not succeeded.
-Status ModuleError(int32_t error) { return error == 0 ? Status::DamagedFile : static_cast<Status>(error); }
+// A module's error number as a status. A module that fails without a number has at least not
+// succeeded.
+Status ModuleError(int32_t error) {
+  return error == 0 ? Status::DamagedFile : static_cast<Status>(error);
+}
 
-std::string CommentText(const PictureRecord& picture) { return {picture.comment.begin(), picture.comment.end()}; }
+std::string CommentText(const PictureRecord& picture) {
+  return {picture.comment.begin(), picture.comment.end()};
+}
 
 Status TakeInfo(const FMW_PICTURE_INFO& info, PictureRecord& picture) {
-  const bool depthFits = (info.bitsPerPixel >= 1 && info.bitsPerPixel <= 8) || info.bitsPerPixel == 16 ||
-                         info.bitsPerPixel == 24 || info.bitsPerPixel == 32;
+  const bool depthFits = (info.bitsPerPixel >= 1 && info.bitsPerPixel <= 8) ||
+                         info.bitsPerPixel == 16 || info.bitsPerPixel == 24 ||
+                         info.bitsPerPixel == 32;
   if (info.width < 1 || info.height < 1 || !depthFits) return Status::DamagedFile;
   picture.width = info.width;
   picture.height = info.height;
@@ -109,24 +121,27 @@ Status TakeInfo(const FMW_PICTURE_INFO& info, PictureRecord& picture) {
   picture.pageCount = std::clamp(info.frame, 1, 1 << 20);
   picture.metadata.dpiX = std::clamp(info.dpiX, 0, 1 << 20);
   picture.metadata.dpiY = std::clamp(info.dpiY, 0, 1 << 20);
-  picture.imageBytes = info.imageBytes > 0 ? static_cast<uint64_t>(info.imageBytes)
-                                           : EstimateImageBytes(info.width, info.height, picture.bitsPerPixel);
+  picture.imageBytes = info.imageBytes > 0
+                           ? static_cast<uint64_t>(info.imageBytes)
+                           : EstimateImageBytes(info.width, info.height, picture.bitsPerPixel);
   picture.background = static_cast<Color>(info.background) & 0xffffff;
   std::copy(std::begin(info.palette), std::end(info.palette), picture.palette.begin());
   picture.typeName.Clear();
-  if (info.version >= FMW_PLUGIN_VERSION) picture.typeName.AssignCut({info.typeName, sizeof info.typeName - 1});
+  if (info.version >= FMW_PLUGIN_VERSION)
+    picture.typeName.AssignCut({info.typeName, sizeof info.typeName - 1});
   return Status::Ok;
 }
 
 // Lets the module write the picture to `path`.
-Status CallWriter(const PluginEntry& entry, PictureRecord& picture, const std::string& path, bool withComment) {
+Status CallWriter(const PluginEntry& entry, PictureRecord& picture, const std::string& path,
+                  bool withComment) {
   const std::string comment = withComment ? CommentText(picture) : std::string();
   void* bitmap = NewModuleBitmap(picture.image, picture.alpha);
   if (bitmap == nullptr) return Status::MemoryAllocationError;
   int32_t error = 0;
   ModuleCall call(picture);
-  const int32_t written =
-      entry.exports.writeImage(path.c_str(), bitmap, comment.empty() ? nullptr : comment.c_str(), &error, call.Services());
+  const int32_t written = entry.exports.writeImage(
+      path.c_str(), bitmap, comment.empty() ? nullptr : comment.c_str(), &error, call.Services());
   platform::FreeModuleBlock(bitmap);
   if (written != 0) return Status::Ok;
   return error == 0 ? Status::ErrorWritingFile : static_cast<Status>(error);
@@ -143,7 +158,8 @@ Status PluginInfo(PictureRecord& picture, const ReadRequest& request) {
   info.frame = request.page;
   int32_t error = 0;
   ModuleCall call(picture, &request.options);
-  if (entry->exports.getInfo(&info, request.fileName.c_str(), &error, call.Services()) == 0) return ModuleError(error);
+  if (entry->exports.getInfo(&info, request.fileName.c_str(), &error, call.Services()) == 0)
+    return ModuleError(error);
   picture.fileSize = platform::FactsOf(request.fileName).size;
   return TakeInfo(info, picture);
 }

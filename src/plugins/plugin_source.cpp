@@ -1,4 +1,5 @@
-// Joins the plug-in table to the registry: modules are loaded the first time that the registry asks.
+// Joins the plug-in table to the registry: modules are loaded the first time that the registry
+// asks.
 
 #include <mutex>
 

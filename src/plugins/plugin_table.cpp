@@ -33,7 +33,9 @@ std::vector<std::string>& ModulesOff() {
   return names;
 }
 
-bool IsOn(std::string_view name) { return std::ranges::find(ModulesOff(), name) == ModulesOff().end(); }
+bool IsOn(std::string_view name) {
+  return std::ranges::find(ModulesOff(), name) == ModulesOff().end();
+}
 
 std::string FolderOr(const std::string& folder) {
   return folder.empty() ? platform::JoinFolder(platform::ProgramFolder(), "plugin") : folder;
@@ -49,14 +51,21 @@ bool IsModuleName(std::string_view name) {
 
 PluginExports LookUpExports(const platform::SharedLibrary& library) {
   PluginExports exports;
-  exports.getVersion = library.FunctionNamed<std::remove_pointer_t<FMW_GET_VERSION>>("PLUGIN11GetVersion");
-  exports.getCopyright = library.FunctionNamed<std::remove_pointer_t<FMW_GET_COPYRIGHT>>("PLUGIN11GetCopyright");
-  exports.getParams = library.FunctionNamed<std::remove_pointer_t<FMW_GET_PARAMS>>("PLUGIN11GetPluginParams");
-  exports.readImage = library.FunctionNamed<std::remove_pointer_t<FMW_READ_IMAGE>>("PLUGIN11ReadImage");
-  exports.writeImage = library.FunctionNamed<std::remove_pointer_t<FMW_WRITE_IMAGE>>("PLUGIN11WriteImage");
+  exports.getVersion =
+      library.FunctionNamed<std::remove_pointer_t<FMW_GET_VERSION>>("PLUGIN11GetVersion");
+  exports.getCopyright =
+      library.FunctionNamed<std::remove_pointer_t<FMW_GET_COPYRIGHT>>("PLUGIN11GetCopyright");
+  exports.getParams =
+      library.FunctionNamed<std::remove_pointer_t<FMW_GET_PARAMS>>("PLUGIN11GetPluginParams");
+  exports.readImage =
+      library.FunctionNamed<std::remove_pointer_t<FMW_READ_IMAGE>>("PLUGIN11ReadImage");
+  exports.writeImage =
+      library.FunctionNamed<std::remove_pointer_t<FMW_WRITE_IMAGE>>("PLUGIN11WriteImage");
   exports.getInfo = library.FunctionNamed<std::remove_pointer_t<FMW_GET_INFO>>("PLUGIN11GetInfo");
-  exports.getComment = library.FunctionNamed<std::remove_pointer_t<FMW_GET_COMMENT>>("PLUGIN11GetComment");
-  exports.configure = library.FunctionNamed<std::remove_pointer_t<FMW_CONFIGURE_CALL>>("PLUGIN11DoConfigure");
+  exports.getComment =
+      library.FunctionNamed<std::remove_pointer_t<FMW_GET_COMMENT>>("PLUGIN11GetComment");
+  exports.configure =
+      library.FunctionNamed<std::remove_pointer_t<FMW_CONFIGURE_CALL>>("PLUGIN11DoConfigure");
   return exports;
 }
 
@@ -85,7 +94,8 @@ bool RegisterFormat(const std::string& path, int32_t index, std::vector<LoadedEn
   if (!loaded.library.Load(path) || !loaded.entry.path.Assign(path)) return false;
   PluginEntry& entry = loaded.entry;
   entry.exports = LookUpExports(loaded.library);
-  if (entry.exports.getParams == nullptr || entry.exports.readImage == nullptr || entry.exports.getInfo == nullptr) {
+  if (entry.exports.getParams == nullptr || entry.exports.readImage == nullptr ||
+      entry.exports.getInfo == nullptr) {
     return false;
   }
   FMW_PLUGIN_PARAMS params = {};
@@ -105,7 +115,8 @@ bool RegisterFormat(const std::string& path, int32_t index, std::vector<LoadedEn
 }
 
 bool ComesBefore(const LoadedEntry& a, const LoadedEntry& b) {
-  const std::string left = LowerCase(a.entry.extension.view()), right = LowerCase(b.entry.extension.view());
+  const std::string left = LowerCase(a.entry.extension.view()),
+                    right = LowerCase(b.entry.extension.view());
   return left != right ? left < right : a.entry.path.view() < b.entry.path.view();
 }
 
@@ -186,7 +197,8 @@ bool PluginCanHandle(std::string_view fileName) {
 }
 
 bool ConfigurePlugin(int32_t index) {
-  if (index < 0 || index >= PluginFormatCount() || PluginRow(index).exports.configure == nullptr) return false;
+  if (index < 0 || index >= PluginFormatCount() || PluginRow(index).exports.configure == nullptr)
+    return false;
   FMW_CONFIGURE block = {};
   block.size = sizeof block;
   block.version = FMW_PLUGIN_VERSION;

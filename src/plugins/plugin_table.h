@@ -39,12 +39,13 @@ static_assert(sizeof(void*) != 4 || sizeof(PluginEntry) == 1088);  // as 32-bit 
 // At most this many formats of one module are registered.
 inline constexpr int32_t kFormatsPerModule = 32;
 
-// Loads every module of `folder` (the folder "plugin" beside the program unless one is given) and registers its formats,
-// sorted by extension and then by module path. Modules that lack a required export or refuse are skipped in silence.
-// Returns the number of formats. A second scan replaces the first.
+// Loads every module of `folder` (the folder "plugin" beside the program unless one is given) and
+// registers its formats, sorted by extension and then by module path. Modules that lack a required
+// export or refuse are skipped in silence. Returns the number of formats. A second scan replaces
+// the first.
 int32_t ScanPlugins(const std::string& folder = {});
-// The modules of that folder by file name, loaded or not, and the user's switch of each: one that is off is passed over
-// by the next scan.
+// The modules of that folder by file name, loaded or not, and the user's switch of each: one that
+// is off is passed over by the next scan.
 struct PluginModule {
   std::string name;
   bool on = true;
@@ -60,7 +61,8 @@ void UnloadPlugins();
 int32_t PluginFormatCount();
 // Row `index` of the table, from 0; it lives until the next scan.
 const PluginEntry& PluginRow(int32_t index);
-// The extension of a row, and the deepest picture that it writes when it can write at all (else 0). False beyond the end.
+// The extension of a row, and the deepest picture that it writes when it can write at all (else 0).
+// False beyond the end.
 bool PluginExtension(int32_t index, std::string& extension, uint32_t& flags1);
 bool PluginTextA(int32_t index, std::string& text);  // the row's first text; false beyond the end
 // The second one: the module's description of its formats.
@@ -70,13 +72,15 @@ const PluginEntry* FindPluginEntry(std::string_view fileName);
 // Whether the entry of the file's extension can hold more than one picture (value 4 of flags 2).
 bool PluginCanHandle(std::string_view fileName);
 
-// Makes the formats of all modules known to the registry. Modules are loaded when a name matches no built-in row, or
-// when a list asks for them, never before. `folder` as for ScanPlugins.
+// Makes the formats of all modules known to the registry. Modules are loaded when a name matches no
+// built-in row, or when a list asks for them, never before. `folder` as for ScanPlugins.
 void EnablePlugins(const std::string& folder = {});
 
-// Calls a row's own settings dialog. False when the module offers none; the text to show then is kNothingToConfigure.
+// Calls a row's own settings dialog. False when the module offers none; the text to show then is
+// kNothingToConfigure.
 bool ConfigurePlugin(int32_t index);
-inline constexpr std::string_view kNothingToConfigure = TrLater("No configuration items are available for the selected plugin.");
+inline constexpr std::string_view kNothingToConfigure =
+    TrLater("No configuration items are available for the selected plugin.");
 // The help page of a module beneath the program's folder: "html\NAME", with the system's separator.
 std::string PluginHelpPage(int32_t index);
 

@@ -14,7 +14,8 @@ constexpr int32_t kBandsACore = 4;  // so that Abort is seen in time and cores f
 
 Status ForBands(int32_t rows, int32_t least, const Work& work, const BandFunction& band) {
   if (rows <= 0) return Status::Ok;
-  const auto cores = work.threads == 1 ? 1 : static_cast<int32_t>(std::min(WorkerPool::Shared().Cores(), 64u));
+  const auto cores =
+      work.threads == 1 ? 1 : static_cast<int32_t>(std::min(WorkerPool::Shared().Cores(), 64u));
   const int32_t height = std::clamp(std::max(least, rows / (cores * kBandsACore)), 1, rows);
   const auto part = [&](int32_t number) {
     if (!work.GoesOn()) return Status::FunctionCancelled;

@@ -22,7 +22,8 @@ struct Background {
 
 void BlendBlock(uint8_t* bgr, const uint8_t* alpha, int32_t pixels, const Background& background) {
   if (std::all_of(alpha, alpha + pixels, [](uint8_t a) { return a == 255; })) return;
-  uint8_t spread[3 * kAtOnce + 1];  // each alpha three times, so that the loop below sees bytes that do not differ in kind
+  // each alpha three times, so that the loop below sees bytes that do not differ in kind
+  uint8_t spread[3 * kAtOnce + 1];
   for (int32_t i = 0; i < pixels; ++i) {
     const uint32_t four = alpha[i] * 0x01010101u;
     std::memcpy(spread + 3 * i, &four, 4);
@@ -52,7 +53,8 @@ Status FlattenAlpha(PictureRecord& picture) {
       uint8_t* bgr = picture.image.StoredRow(r).data();
       const uint8_t* alpha = picture.alpha.StoredRow(r).data();
       for (int32_t x = 0; x < width; x += kAtOnce) {
-        BlendBlock(bgr + 3 * static_cast<size_t>(x), alpha + x, std::min(kAtOnce, width - x), background);
+        BlendBlock(bgr + 3 * static_cast<size_t>(x), alpha + x, std::min(kAtOnce, width - x),
+                   background);
       }
     }
   }

@@ -13,7 +13,8 @@ Status PaddedRows::Open(const PackedImage& image, int32_t reach) {
   pixel_ = image.Bits() == 24 ? 3 : 1;
   stride_ = (static_cast<size_t>(image.Width()) + 2 * static_cast<size_t>(reach)) * pixel_;
   const auto kept = static_cast<uint64_t>(kept_);
-  if (!rows_.Allocate(stride_ * kept, platform::Fill::Unset) || !held_.Allocate(kept * sizeof(int32_t))) {
+  if (!rows_.Allocate(stride_ * kept, platform::Fill::Unset) ||
+      !held_.Allocate(kept * sizeof(int32_t))) {
     return Status::MemoryAllocationError;
   }
   std::ranges::fill(held_.Items<int32_t>(), -1);

@@ -8,7 +8,8 @@ namespace fotomill {
 
 namespace {
 
-// For each byte of a plane its eight bits as the lowest bits of eight 4-bit pixels, the first pixel in the top bits.
+// For each byte of a plane its eight bits as the lowest bits of eight 4-bit pixels, the first pixel
+// in the top bits.
 constexpr std::array<uint32_t, 256> MakeSpreadBits() {
   std::array<uint32_t, 256> table{};
   for (uint32_t bits = 0; bits < 256; ++bits) {
@@ -32,10 +33,15 @@ static_assert(GatherBits(kSpreadBits[0xA7]) == 0xA7);
 
 constexpr char kNone = -128;  // an index that gives 0
 
-BYTE_SHUFFLE __m128i Load(const uint8_t* bytes) { return _mm_loadu_si128(reinterpret_cast<const __m128i*>(bytes)); }
-BYTE_SHUFFLE void Store(uint8_t* bytes, __m128i value) { _mm_storeu_si128(reinterpret_cast<__m128i*>(bytes), value); }
+BYTE_SHUFFLE __m128i Load(const uint8_t* bytes) {
+  return _mm_loadu_si128(reinterpret_cast<const __m128i*>(bytes));
+}
+BYTE_SHUFFLE void Store(uint8_t* bytes, __m128i value) {
+  _mm_storeu_si128(reinterpret_cast<__m128i*>(bytes), value);
+}
 
-// Every third byte of 48, from byte `first` on: three registers, each shuffled to where its bytes belong.
+// Every third byte of 48, from byte `first` on: three registers, each shuffled to where its bytes
+// belong.
 BYTE_SHUFFLE __m128i EveryThird(__m128i a, __m128i b, __m128i c, int first) {
   alignas(16) static constexpr char kIndices[3][3][16] = {
       {{0, 3, 6, 9, 12, 15, kNone, kNone, kNone, kNone, kNone, kNone, kNone, kNone, kNone, kNone},
@@ -55,7 +61,8 @@ BYTE_SHUFFLE __m128i EveryThird(__m128i a, __m128i b, __m128i c, int first) {
   return _mm_or_si128(_mm_or_si128(fromA, fromB), fromC);
 }
 
-BYTE_SHUFFLE size_t SplitColorsFast(const uint8_t* bgr, size_t count, uint8_t* blue, uint8_t* green, uint8_t* red) {
+BYTE_SHUFFLE size_t SplitColorsFast(const uint8_t* bgr, size_t count, uint8_t* blue, uint8_t* green,
+                                    uint8_t* red) {
   size_t x = 0;
   for (; x + 16 <= count; x += 16, bgr += 48) {
     const __m128i a = Load(bgr), b = Load(bgr + 16), c = Load(bgr + 32);
@@ -86,7 +93,8 @@ BYTE_SHUFFLE __m128i Interleaved(__m128i blue, __m128i green, __m128i red, int p
   return _mm_or_si128(_mm_or_si128(fromBlue, fromGreen), fromRed);
 }
 
-BYTE_SHUFFLE size_t MergeColorsFast(const uint8_t* blue, const uint8_t* green, const uint8_t* red, size_t count, uint8_t* bgr) {
+BYTE_SHUFFLE size_t MergeColorsFast(const uint8_t* blue, const uint8_t* green, const uint8_t* red,
+                                    size_t count, uint8_t* bgr) {
   size_t x = 0;
   for (; x + 16 <= count; x += 16, bgr += 48) {
     const __m128i b = Load(blue + x), g = Load(green + x), r = Load(red + x);
@@ -99,7 +107,8 @@ BYTE_SHUFFLE size_t MergeColorsFast(const uint8_t* blue, const uint8_t* green, c
 
 // Four pixels at a time; the store writes four bytes too many, so the last pixels are left.
 BYTE_SHUFFLE size_t DropFourthFast(const uint8_t* bgrx, size_t count, uint8_t* bgr) {
-  const __m128i indices = _mm_setr_epi8(0, 1, 2, 4, 5, 6, 8, 9, 10, 12, 13, 14, kNone, kNone, kNone, kNone);
+  const __m128i indices =
+      _mm_setr_epi8(0, 1, 2, 4, 5, 6, 8, 9, 10, 12, 13, 14, kNone, kNone, kNone, kNone);
   size_t x = 0;
   for (; x + 6 <= count; x += 4) Store(bgr + 3 * x, _mm_shuffle_epi8(Load(bgrx + 4 * x), indices));
   return x;
@@ -109,7 +118,8 @@ BYTE_SHUFFLE size_t DropFourthFast(const uint8_t* bgrx, size_t count, uint8_t* b
 BYTE_SHUFFLE size_t SwapColorsFast(const uint8_t* source, size_t count, uint8_t* target) {
   const __m128i indices = _mm_setr_epi8(2, 1, 0, 5, 4, 3, 8, 7, 6, 11, 10, 9, 14, 13, 12, kNone);
   size_t x = 0;
-  for (; x + 6 <= count; x += 5) Store(target + 3 * x, _mm_shuffle_epi8(Load(source + 3 * x), indices));
+  for (; x + 6 <= count; x += 5)
+    Store(target + 3 * x, _mm_shuffle_epi8(Load(source + 3 * x), indices));
   return x;
 }
 
@@ -141,7 +151,8 @@ void SplitColors(const uint8_t* bgr, size_t count, uint8_t* blue, uint8_t* green
   }
 }
 
-void MergeColors(const uint8_t* blue, const uint8_t* green, const uint8_t* red, size_t count, uint8_t* bgr) {
+void MergeColors(const uint8_t* blue, const uint8_t* green, const uint8_t* red, size_t count,
+                 uint8_t* bgr) {
   size_t x = 0;
 #ifdef BYTE_SHUFFLE
   if (CanShuffleBytes()) x = MergeColorsFast(blue, green, red, count, bgr);
@@ -182,16 +193,19 @@ void MergeAlpha(const uint8_t* bgr, const uint8_t* alpha, size_t count, uint8_t*
 void SplitBitPlanes(const uint8_t* row, size_t count, int planes, size_t planeSize, uint8_t* bits) {
   for (size_t x = 0; x < count; x += 8) {
     const uint8_t* bytes = row + x / 2;
-    uint32_t pixels = uint32_t{bytes[0]} << 24 | uint32_t{bytes[1]} << 16 | uint32_t{bytes[2]} << 8 | bytes[3];
+    uint32_t pixels =
+        uint32_t{bytes[0]} << 24 | uint32_t{bytes[1]} << 16 | uint32_t{bytes[2]} << 8 | bytes[3];
     if (count - x < 8) pixels &= ~(UINT32_MAX >> 4 * (count - x));
-    for (int p = 0; p < planes; ++p) bits[static_cast<size_t>(p) * planeSize + x / 8] = GatherBits(pixels >> p);
+    for (int p = 0; p < planes; ++p)
+      bits[static_cast<size_t>(p) * planeSize + x / 8] = GatherBits(pixels >> p);
   }
 }
 
 void MergeBitPlanes(const uint8_t* bits, size_t count, int planes, size_t planeSize, uint8_t* row) {
   for (size_t x = 0; x < count; x += 8) {
     uint32_t pixels = 0;
-    for (int p = 0; p < planes; ++p) pixels |= kSpreadBits[bits[static_cast<size_t>(p) * planeSize + x / 8]] << p;
+    for (int p = 0; p < planes; ++p)
+      pixels |= kSpreadBits[bits[static_cast<size_t>(p) * planeSize + x / 8]] << p;
     if (count - x < 8) pixels &= ~(UINT32_MAX >> 4 * (count - x));
     for (size_t i = 0; i < 4; ++i) row[x / 2 + i] = static_cast<uint8_t>(pixels >> (24 - 8 * i));
   }

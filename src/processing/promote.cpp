@@ -21,7 +21,8 @@ void UnpackIndices(const uint8_t* packed, int32_t width, uint8_t* indices) {
   for (int32_t i = 0; x < width; ++x, ++i) indices[x] = *packed >> (8 - bits * (i + 1)) & kMask;
 }
 
-// Each pixel's table entry of four bytes is stored whole where the next pixel overwrites its fourth byte.
+// Each pixel's table entry of four bytes is stored whole where the next pixel overwrites its fourth
+// byte.
 template <int bits>
 void ExpandRow(const uint8_t* packed, const uint8_t* colorTable, int32_t width, uint8_t* bgr) {
   constexpr int32_t kPerByte = 8 / bits;
@@ -33,10 +34,13 @@ void ExpandRow(const uint8_t* packed, const uint8_t* colorTable, int32_t width, 
   std::memcpy(bgr, entry(width - 1), 3);
 }
 
-uint32_t ColorAt(const uint8_t* bgr) { return static_cast<uint32_t>(bgr[2] << 16 | bgr[1] << 8 | bgr[0]); }
+uint32_t ColorAt(const uint8_t* bgr) {
+  return static_cast<uint32_t>(bgr[2] << 16 | bgr[1] << 8 | bgr[0]);
+}
 
 int32_t Brightness(uint32_t color) {
-  return static_cast<int32_t>(299 * (color >> 16) + 587 * (color >> 8 & 0xff) + 114 * (color & 0xff));
+  return static_cast<int32_t>(299 * (color >> 16) + 587 * (color >> 8 & 0xff) +
+                              114 * (color & 0xff));
 }
 
 constexpr int32_t DepthForColors(int32_t colors) { return colors <= 2 ? 1 : colors <= 16 ? 4 : 8; }
@@ -45,7 +49,10 @@ constexpr int32_t DepthForColors(int32_t colors) { return colors <= 2 ? 1 : colo
 
 Status BgrRows::Open(const PackedImage& image) {
   image_ = &image;
-  expand_ = image.Bits() == 1 ? ExpandRow<1> : image.Bits() == 4 ? ExpandRow<4> : image.Bits() == 8 ? ExpandRow<8> : nullptr;
+  expand_ = image.Bits() == 1   ? ExpandRow<1>
+            : image.Bits() == 4 ? ExpandRow<4>
+            : image.Bits() == 8 ? ExpandRow<8>
+                                : nullptr;
   if (expand_ == nullptr) return Status::Ok;
   const auto table = image.ColorTable();
   std::copy(table.begin(), table.end(), colors_.begin());
@@ -99,7 +106,8 @@ Status PromoteImage(const PackedImage& image, int32_t bits, PackedImage& promote
     std::copy(table.begin(), table.end(), made.ColorTable().begin());
     const auto unpack = image.Bits() == 1 ? UnpackIndices<1> : UnpackIndices<4>;
     platform::MemoryBlock indices;
-    if (!indices.Allocate(static_cast<uint64_t>(width), platform::Fill::Unset)) return Status::MemoryAllocationError;
+    if (!indices.Allocate(static_cast<uint64_t>(width), platform::Fill::Unset))
+      return Status::MemoryAllocationError;
     for (int32_t r = 0; r < image.Height(); ++r) {
       unpack(image.StoredRow(r).data(), width, indices.Data());
       PackIndices(indices.Data(), width, made.Bits(), made.StoredRow(r).data());
@@ -154,7 +162,9 @@ void ColorSet::Number(Palette& palette) {
     if (slot != kFree) colors[found++] = slot;
   }
   std::sort(colors.begin(), colors.begin() + static_cast<std::ptrdiff_t>(found),
-            [](uint32_t a, uint32_t b) { return std::pair(Brightness(a), a) < std::pair(Brightness(b), b); });
+            [](uint32_t a, uint32_t b) {
+              return std::pair(Brightness(a), a) < std::pair(Brightness(b), b);
+            });
   palette.fill(0);
   for (size_t i = 0; i < found; ++i) {
     indices_[SlotOf(colors[i])] = static_cast<uint8_t>(i);
@@ -183,7 +193,8 @@ Status PackFewColors(PictureRecord& picture, int32_t maxBits, bool& packed) {
   PackedImage made;
   RETURN_IF_BAD(NewPackedImage(width, picture.image.Height(), &palette, bits, made));
   platform::MemoryBlock indices;
-  if (!indices.Allocate(static_cast<uint64_t>(width), platform::Fill::Unset)) return Status::MemoryAllocationError;
+  if (!indices.Allocate(static_cast<uint64_t>(width), platform::Fill::Unset))
+    return Status::MemoryAllocationError;
   for (int32_t y = 0; y < picture.image.Height(); ++y) {
     const uint8_t* bgr = rows.Row(y);
     uint32_t last = ColorAt(bgr);

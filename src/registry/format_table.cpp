@@ -23,8 +23,8 @@ Status UnpublishedWrite(PictureRecord&, const WriteOptions&) { return Status::Un
 int32_t Ready() { return 1; }
 int32_t NoStartup() { return 0; }
 
-// A place of the registry. A family of codecs fills it by a row of that extension; the facts of a format that no codec of this
-// build knows stand here.
+// A place of the registry. A family of codecs fills it by a row of that extension; the facts of a
+// format that no codec of this build knows stand here.
 struct Place {
   std::string_view extension;
   std::string_view description = {};
@@ -35,7 +35,8 @@ struct Place {
   LifeOperation startup = nullptr;  // and shutdown
 };
 
-// The order is behavior: the first row that matches a name wins, so .jpeg is read as JPE and .tiff as TIF.
+// The order is behavior: the first row that matches a name wins, so .jpeg is read as JPE and .tiff
+// as TIF.
 // clang-format off
 constexpr Place kPlaces[] = {
     {"AVI", "(AVI) Video for Windows", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES},
@@ -131,7 +132,8 @@ FormatEntry RowWithoutCodec(const Place& place) {
   row.description = place.description;
   row.enabled = place.enabled;
   row.flags = place.flags;
-  row.whyNot = place.unpublished ? TrLater("The format was never published.") : TrLater("This build has no codec for the format.");
+  row.whyNot = place.unpublished ? TrLater("The format was never published.")
+                                 : TrLater("This build has no codec for the format.");
   return row;
 }
 

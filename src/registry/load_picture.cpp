@@ -48,11 +48,13 @@ Status OpenAnimation(const ReadRequest& request, AnimationPointer& animation) {
   return animate == nullptr ? Status::UnsupportedFunction : animate(request, animation);
 }
 
-Status WritePicture(PictureRecord& picture, std::string_view destination, const WriteOptions& options) {
+Status WritePicture(PictureRecord& picture, std::string_view destination,
+                    const WriteOptions& options) {
   return WritePictureAs(picture, destination, FindFormatByName(destination), options);
 }
 
-Status WritePictureAs(PictureRecord& picture, std::string_view destination, int32_t formatIndex, const WriteOptions& options) {
+Status WritePictureAs(PictureRecord& picture, std::string_view destination, int32_t formatIndex,
+                      const WriteOptions& options) {
   if (formatIndex == kNoFormat) return Status::UnsupportedFormat;
   const FormatEntry& row = FormatRow(formatIndex);
   if (picture.bitsPerPixel > static_cast<int32_t>(row.maxBits)) return Status::TooManyColors;
@@ -60,7 +62,8 @@ Status WritePictureAs(PictureRecord& picture, std::string_view destination, int3
   if (picture.image.Empty() && picture.metafile.Empty()) return Status::EmptyImage;
   if (destination.size() > PathText::Capacity()) return Status::InvalidDestination;
   if ((row.flags & FMT_ALPHA) == 0) RETURN_IF_BAD(FlattenAlpha(picture));
-  if (picture.bitsPerPixel > static_cast<int32_t>(row.maxBits)) return Status::TooManyColors;  // flattened palette pictures
+  // flattened palette pictures
+  if (picture.bitsPerPixel > static_cast<int32_t>(row.maxBits)) return Status::TooManyColors;
   picture.workName = picture.fileName;
   picture.fileName.AssignCut(destination);
   picture.lostMetadata = static_cast<uint8_t>(kAllMetadata & ~row.keepsMetadata);

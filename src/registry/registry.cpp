@@ -21,15 +21,18 @@ constinit thread_local FormatEntry spareRow = SpareRow();
 const PluginSource* pluginSource = nullptr;
 std::atomic<bool> pluginsOverride = false;
 
-// A row matches an extension that equals its own, or that shares its first three characters; a shorter one must match
-// to its end.
+// A row matches an extension that equals its own, or that shares its first three characters; a
+// shorter one must match to its end.
 bool RowMatches(std::string_view rowExtension, std::string_view extension) {
-  return EqualIgnoringCase(extension, rowExtension) || EqualIgnoringCase(extension.substr(0, 3), rowExtension.substr(0, 3));
+  return EqualIgnoringCase(extension, rowExtension) ||
+         EqualIgnoringCase(extension.substr(0, 3), rowExtension.substr(0, 3));
 }
 
 }  // namespace
 
-FormatEntry& FormatRow(int32_t index) { return index == kSpareRow ? spareRow : Table()[static_cast<size_t>(index)]; }
+FormatEntry& FormatRow(int32_t index) {
+  return index == kSpareRow ? spareRow : Table()[static_cast<size_t>(index)];
+}
 
 int32_t EnabledByDefault(int32_t index) {
   static const FormatTable asBuilt = MakeFormatTable();
@@ -63,17 +66,24 @@ std::string PluginDescription(const PluginFormatFacts& format) {
   return "(" + format.extension + ") Plugin" + (format.textB.empty() ? "" : " " + format.textB);
 }
 
-bool CanRead(const FormatEntry& row) { return row.canRead && (row.present == nullptr || row.present()); }
+bool CanRead(const FormatEntry& row) {
+  return row.canRead && (row.present == nullptr || row.present());
+}
 
-bool CanWrite(const FormatEntry& row) { return row.canWrite && (row.present == nullptr || row.present()); }
+bool CanWrite(const FormatEntry& row) {
+  return row.canWrite && (row.present == nullptr || row.present());
+}
 
-std::string_view WhyNot(const FormatEntry& row) { return CanRead(row) && CanWrite(row) ? std::string_view() : row.whyNot; }
+std::string_view WhyNot(const FormatEntry& row) {
+  return CanRead(row) && CanWrite(row) ? std::string_view() : row.whyNot;
+}
 
 std::vector<const FormatSettings*> SettingsOfFormats() {
   std::vector<const FormatSettings*> all;
   for (const std::span<const FormatEntry> family : FormatFamilies()) {
     for (const FormatEntry& row : family) {
-      if (row.settings != nullptr && std::ranges::find(all, row.settings) == all.end()) all.push_back(row.settings);
+      if (row.settings != nullptr && std::ranges::find(all, row.settings) == all.end())
+        all.push_back(row.settings);
     }
   }
   return all;
@@ -84,7 +94,9 @@ std::vector<FormatLibrary> LibrariesOfFormats() {
   for (const std::span<const FormatEntry> family : FormatFamilies()) {
     for (const FormatEntry& row : family) {
       for (const FormatLibrary& library : row.libraries) {
-        const auto same = [&](const FormatLibrary& known) { return std::string_view(known.name) == library.name; };
+        const auto same = [&](const FormatLibrary& known) {
+          return std::string_view(known.name) == library.name;
+        };
         if (std::ranges::none_of(all, same)) all.push_back(library);
       }
     }
@@ -107,7 +119,8 @@ void RunFormatShutdown() {
 std::string DescribeFileType(std::string_view fileName) {
   const std::string extension = UpperCase(platform::ExtensionOf(fileName));
   for (const FormatEntry& row : Table()) {
-    if (row.enabled == 0 || (row.flags & (FMT_WALLPAPER | FMT_CLIPBOARD | FMT_SPARE)) != 0) continue;
+    if (row.enabled == 0 || (row.flags & (FMT_WALLPAPER | FMT_CLIPBOARD | FMT_SPARE)) != 0)
+      continue;
     if (EqualIgnoringCase(row.extension, extension)) return std::string(row.description.view());
   }
   return "(" + extension + ") " + extension + " file";
@@ -129,7 +142,8 @@ std::vector<FilterPair> OpenFileFilter() {
 }
 
 std::vector<int32_t> DestinationRows() {
-  constexpr uint32_t kExcluded = FMT_WALLPAPER | FMT_CLIPBOARD | FMT_SECONDARY | FMT_ANIMATED | FMT_SPARE;
+  constexpr uint32_t kExcluded =
+      FMT_WALLPAPER | FMT_CLIPBOARD | FMT_SECONDARY | FMT_ANIMATED | FMT_SPARE;
   std::vector<int32_t> rows;
   for (int32_t i = 0; i < formatCount; ++i) {
     const uint32_t flags = FormatRow(i).flags;
@@ -140,7 +154,8 @@ std::vector<int32_t> DestinationRows() {
 
 std::vector<std::string> DestinationExtensions() {
   std::vector<std::string> extensions;
-  for (const int32_t index : DestinationRows()) extensions.push_back(LowerCase(FormatRow(index).extension.view()));
+  for (const int32_t index : DestinationRows())
+    extensions.push_back(LowerCase(FormatRow(index).extension.view()));
   for (const PluginFormatFacts& format : PluginFormats()) {
     if (format.canWrite) extensions.push_back(LowerCase(format.extension));
   }
@@ -159,7 +174,8 @@ std::vector<int32_t> ChoiceRows() {
   std::vector<int32_t> rows;
   for (int32_t i = 0; i < formatCount; ++i) {
     const FormatEntry& row = FormatRow(i);
-    if (row.enabled == 1 && (row.flags & (FMT_CLIPBOARD | FMT_HIDDEN | FMT_SPARE)) == 0) rows.push_back(i);
+    if (row.enabled == 1 && (row.flags & (FMT_CLIPBOARD | FMT_HIDDEN | FMT_SPARE)) == 0)
+      rows.push_back(i);
   }
   return rows;
 }

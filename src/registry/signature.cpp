@@ -12,13 +12,15 @@ namespace {
 
 using namespace std::string_view_literals;
 
-// A signature and the extension of the row that means such files; none for files of kinds that the registry does not have.
+// A signature and the extension of the row that means such files; none for files of kinds that the
+// registry does not have.
 struct SignatureOfRow {
   std::string_view extension;
   Signature signature;
 };
 
-// Signatures of formats that have no codec, and of files that people take for pictures of a format of ours.
+// Signatures of formats that have no codec, and of files that people take for pictures of a format
+// of ours.
 // clang-format off
 constexpr SignatureOfRow kWithoutCodec[] = {
     {"PIC",  {0, "\xff\xd8\xff"sv}},
@@ -126,10 +128,12 @@ constexpr SignatureOfRow kWithoutCodec[] = {
 };
 // clang-format on
 
-size_t Length(const Signature& signature) { return signature.bytes.size() + signature.second.size(); }
+size_t Length(const Signature& signature) {
+  return signature.bytes.size() + signature.second.size();
+}
 
-// Long signatures before those of a few bytes, which other files may begin with by chance; of equal ones first the format
-// that gives the name.
+// Long signatures before those of a few bytes, which other files may begin with by chance; of equal
+// ones first the format that gives the name.
 std::vector<SignatureOfRow> AllSignatures() {
   std::vector<SignatureOfRow> all;
   for (const std::span<const FormatEntry> family : FormatFamilies()) {
@@ -139,7 +143,8 @@ std::vector<SignatureOfRow> AllSignatures() {
   }
   all.insert(all.end(), std::begin(kWithoutCodec), std::end(kWithoutCodec));
   std::ranges::stable_sort(all, [](const SignatureOfRow& a, const SignatureOfRow& b) {
-    if (Length(a.signature) != Length(b.signature)) return Length(a.signature) > Length(b.signature);
+    if (Length(a.signature) != Length(b.signature))
+      return Length(a.signature) > Length(b.signature);
     return !a.signature.name.empty() && b.signature.name.empty();
   });
   return all;
@@ -154,12 +159,15 @@ bool StandsAt(std::span<const uint8_t> head, size_t offset, std::string_view tex
 }
 
 bool Fits(std::span<const uint8_t> head, const Signature& signature) {
-  return StandsAt(head, signature.offset, signature.bytes) && StandsAt(head, signature.secondOffset, signature.second);
+  return StandsAt(head, signature.offset, signature.bytes) &&
+         StandsAt(head, signature.secondOffset, signature.second);
 }
 
 }  // namespace
 
-bool FileKind::IsOf(std::string_view extension) const { return std::ranges::find(extensions, extension) != extensions.end(); }
+bool FileKind::IsOf(std::string_view extension) const {
+  return std::ranges::find(extensions, extension) != extensions.end();
+}
 
 FileKind IdentifySignature(std::span<const uint8_t> head) {
   static const std::vector<SignatureOfRow> all = AllSignatures();

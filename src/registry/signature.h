@@ -11,14 +11,17 @@ namespace fotomill {
 
 // What a file's first bytes say that it is, whatever its name.
 struct FileKind {
-  std::string_view name;                     // as people call the format: "AVIF"; empty when nothing fits
-  std::vector<std::string_view> extensions;  // of the registry's rows that mean such files, the likeliest first
+  // as people call the format: "AVIF"; empty when nothing fits
+  std::string_view name;
+  // of the registry's rows that mean such files, the likeliest first
+  std::vector<std::string_view> extensions;
   bool IsOf(std::string_view extension) const;
 };
 
 inline constexpr size_t kSignatureBytes = 32;  // so many from the start of a file decide
 
-// Recognises a file by its first kSignatureBytes bytes (fewer when it is shorter), by the longest signature that fits.
+// Recognises a file by its first kSignatureBytes bytes (fewer when it is shorter), by the longest
+// signature that fits.
 FileKind IdentifySignature(std::span<const uint8_t> head);
 // The same for a file; nothing fits when it cannot be opened.
 FileKind IdentifyFile(const std::string& fileName);

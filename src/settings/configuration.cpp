@@ -49,7 +49,8 @@ void TakeValues(Configuration& configuration) {
     const SettingValue value = ReadValue(row, entry.value, ValueSource::File);
     if (value.usable) StoreValue(row, value);
     if (value.fault == ValueFault::None || value.fault == ValueFault::Internal) return;
-    configuration.complaints.push_back({&row, value.fault, entry.line, std::string(entry.value.substr(0, PathText::Capacity()))});
+    configuration.complaints.push_back(
+        {&row, value.fault, entry.line, std::string(entry.value.substr(0, PathText::Capacity()))});
   });
 }
 
@@ -69,7 +70,8 @@ ConfigurationState ReadConfigurationText(std::string& text) {
 }
 
 // Makes the changes in the file, and in what this run knows of it.
-SaveResult WriteEdits(std::span<const IniEdit> edits, std::string_view section = kConfigurationSection) {
+SaveResult WriteEdits(std::span<const IniEdit> edits,
+                      std::string_view section = kConfigurationSection) {
   Configuration& configuration = TheConfiguration();
   const std::string path = ConfigurationPath();
   if (path.empty()) return SaveResult::NoFolder;
@@ -88,7 +90,8 @@ SaveResult WriteEdits(std::span<const IniEdit> edits, std::string_view section =
 // Which keys hold the value that the file as this run knows it gives them.
 std::bitset<kKeyCount> UnchangedKeys(const Configuration& configuration) {
   std::bitset<kKeyCount> unchanged;
-  for (const KeyRow& row : Keys()) unchanged[NumberOfKey(row)] = IsAtDefault(row) || (row.type & KEY_INTERNAL) != 0;
+  for (const KeyRow& row : Keys())
+    unchanged[NumberOfKey(row)] = IsAtDefault(row) || (row.type & KEY_INTERNAL) != 0;
   ForEachKey(configuration.text, [&](const KeyRow& row, const IniEntry& entry) {
     const SettingValue value = ReadValue(row, entry.value, ValueSource::File);
     if (value.usable) unchanged[NumberOfKey(row)] = HoldsValue(row, value);
@@ -133,7 +136,8 @@ std::string_view SaveMessage(SaveResult result) {
     case SaveResult::Done:
     case SaveResult::Unchanged: return {};
     case SaveResult::NoFolder: return TrLater("There is no folder for the configuration file.");
-    case SaveResult::Unreadable: return TrLater("The configuration file cannot be read; left unchanged.");
+    case SaveResult::Unreadable:
+      return TrLater("The configuration file cannot be read; left unchanged.");
     case SaveResult::Failed: return TrLater("The configuration file could not be written.");
   }
   return {};
@@ -152,7 +156,8 @@ SaveResult SaveConfiguration() {
 }
 
 SaveResult StoreSetting(const KeyRow& row, const SettingValue& value) {
-  const std::string text = (row.type & KEY_TEXT) != 0 ? std::string(value.text) : std::to_string(value.number);
+  const std::string text =
+      (row.type & KEY_TEXT) != 0 ? std::string(value.text) : std::to_string(value.number);
   const IniEdit edit{row.name, text};
   const SaveResult result = WriteEdits({&edit, 1});
   if (result != SaveResult::Done && result != SaveResult::Unchanged) return result;
@@ -172,7 +177,9 @@ SaveResult RemoveSetting(const KeyRow& row) {
 
 std::string_view ConfigurationText() { return TheConfiguration().text; }
 
-SaveResult StoreInSection(std::string_view section, std::span<const IniEdit> edits) { return WriteEdits(edits, section); }
+SaveResult StoreInSection(std::string_view section, std::span<const IniEdit> edits) {
+  return WriteEdits(edits, section);
+}
 
 bool IsForThisRun(const KeyRow& row) { return TheConfiguration().forThisRun[NumberOfKey(row)]; }
 
@@ -187,17 +194,20 @@ EarlySettings ReadEarlySettings() {
     const SettingValue value = ReadValue(row, found.value_or(""), ValueSource::File);
     return found && value.usable ? value.number : DefaultNumber(row);
   };
-  return {read(KeyNumber::ShowStartupWindow), read(KeyNumber::LogoDelay), read(KeyNumber::NormalTextFontSize),
-          read(KeyNumber::SmallTextFontSize), read(KeyNumber::NormalThumbFontSize)};
+  return {read(KeyNumber::ShowStartupWindow), read(KeyNumber::LogoDelay),
+          read(KeyNumber::NormalTextFontSize), read(KeyNumber::SmallTextFontSize),
+          read(KeyNumber::NormalThumbFontSize)};
 }
 
 std::optional<std::string> LoadConfigurationBlock() {
   const std::string path = ConfigurationPath();
   std::string contents;
-  if (path.empty() || platform::ReadWholeFile(path, limits.listFileBytes, contents) != platform::ReadResult::Done) {
+  if (path.empty() ||
+      platform::ReadWholeFile(path, limits.listFileBytes, contents) != platform::ReadResult::Done) {
     return std::nullopt;
   }
-  if (contents.size() != platform::FactsOf(path).size) return std::nullopt;  // it changed while it was read
+  // it changed while it was read
+  if (contents.size() != platform::FactsOf(path).size) return std::nullopt;
   return std::string(kBlockHeader) + contents;
 }
 

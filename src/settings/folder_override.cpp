@@ -26,7 +26,8 @@ void TakeMode(std::string_view text, std::string_view key, int32_t last, int32_t
 BrowserModes ModesForFolder(const std::string& folder, const BrowserModes& current) {
   if (settings.UseFolderOverrides == 0) return current;
   std::string text;
-  const auto read = platform::ReadWholeFile(platform::JoinFolder(folder, kOverrideFile), limits.listFileBytes, text);
+  const auto read = platform::ReadWholeFile(platform::JoinFolder(folder, kOverrideFile),
+                                            limits.listFileBytes, text);
   return read == platform::ReadResult::Done ? ModesInOverride(text, current) : current;
 }
 

@@ -33,7 +33,9 @@ constexpr ListFile kLists[] = {
 constexpr ListFile kRecentFiles{"FileMenuHistory.txt", &Settings::RecentFilesMaximum};
 
 const ListFile& FileOf(HistoryList list) { return kLists[static_cast<size_t>(list)]; }
-size_t MostOf(const ListFile& file) { return static_cast<size_t>(std::clamp(settings.*file.maximum, 0, kMostEntries)); }
+size_t MostOf(const ListFile& file) {
+  return static_cast<size_t>(std::clamp(settings.*file.maximum, 0, kMostEntries));
+}
 
 bool FitsOnLine(std::string_view entry) {
   return !entry.empty() && entry.size() <= PathText::Capacity() &&
@@ -54,7 +56,9 @@ std::vector<Entry> ParseLines(std::string_view text, size_t most, Parse parse, S
   std::vector<Entry> entries;
   while (!text.empty() && entries.size() < most) {
     const std::optional<Entry> entry = parse(TakeLine(text));
-    if (!entry || std::ranges::any_of(entries, [&](const Entry& other) { return same(other, *entry); })) continue;
+    if (!entry ||
+        std::ranges::any_of(entries, [&](const Entry& other) { return same(other, *entry); }))
+      continue;
     entries.push_back(*entry);
   }
   return entries;
@@ -69,7 +73,8 @@ std::optional<RecentFile> ParseRecentFile(std::string_view line) {
   if (comma == std::string_view::npos || !FitsOnLine(line.substr(0, comma))) return std::nullopt;
   std::string_view rest = line.substr(comma + 1);
   const auto number = TakeNumber(rest);
-  return number ? std::optional<RecentFile>({std::string(line.substr(0, comma)), *number}) : std::nullopt;
+  return number ? std::optional<RecentFile>({std::string(line.substr(0, comma)), *number})
+                : std::nullopt;
 }
 
 bool SamePath(const RecentFile& a, const RecentFile& b) { return a.path == b.path; }
@@ -139,7 +144,9 @@ bool ClearHistoryList(HistoryList list) {
   return EditList(FileOf(list), [](std::string& text) { text.clear(); });
 }
 
-std::vector<RecentFile> LoadRecentFiles() { return ParseRecentFiles(ReadList(kRecentFiles), MostOf(kRecentFiles)); }
+std::vector<RecentFile> LoadRecentFiles() {
+  return ParseRecentFiles(ReadList(kRecentFiles), MostOf(kRecentFiles));
+}
 
 bool AddRecentFile(const RecentFile& file) {
   if (!FitsOnLine(file.path)) return false;

@@ -7,17 +7,20 @@
 
 namespace fotomill {
 
-// Lists of recently used items, the latest first: text files in the data folder, one entry per line. A key tells how long each
-// may get. Changes are merged with those of other processes and written in one step.
+// Lists of recently used items, the latest first: text files in the data folder, one entry per
+// line. A key tells how long each may get. Changes are merged with those of other processes and
+// written in one step.
 
 // The entry, and the value of several text keys, that stands for the built-in choice.
 inline constexpr std::string_view kDefaultEntry = "~~~DEFAULT~~~";
 
 // Each list with its file, the key that tells its length, and what it is of.
 enum class HistoryList {
-  MoveCopy,       // "FMWMoveCopyHistory.txt", CopyHistoryMax: folders that files were moved or copied to
+  // "FMWMoveCopyHistory.txt", CopyHistoryMax: folders that files were moved or copied to
+  MoveCopy,
   Destination,    // "FMWDestinationHistory.txt", DestHistoryMax: folders that functions wrote to
-  Archive,        // "FMWArchiveHistory.txt", ArchiveHistoryMax: folders that archives were extracted to
+  // "FMWArchiveHistory.txt", ArchiveHistoryMax: folders that archives were extracted to
+  Archive,
   PictureSearch,  // "FMWPicturesearchHistory.txt", PictureSearchHistoryMax: what was searched for
   Tabs,           // "FMWTabHistory.txt", TabHistoryMax: folders of closed tabs
   RenameBases,    // "FMWRenameHistory.txt", EditListMaximum: base names of sequential renaming
@@ -25,14 +28,15 @@ enum class HistoryList {
 
 // The entries that may be offered. Empty if there is no list or it cannot be read.
 std::vector<std::string> LoadHistoryList(HistoryList list);
-// Puts an entry first, once. False when it cannot be on a line (it is empty, over 260 bytes or holds a line break or zero
-// byte) or the list cannot be written; the list is then unchanged.
+// Puts an entry first, once. False when it cannot be on a line (it is empty, over 260 bytes or
+// holds a line break or zero byte) or the list cannot be written; the list is then unchanged.
 [[nodiscard]] bool AddToHistoryList(HistoryList list, std::string_view entry);
 // Takes an entry out; true as well when it was not there.
 [[nodiscard]] bool RemoveFromHistoryList(HistoryList list, std::string_view entry);
 [[nodiscard]] bool ClearHistoryList(HistoryList list);  // false when the list cannot be written
 
-// An entry of the File menu: "FileMenuHistory.txt" holds lines "PATH,NUMBER", RecentFilesMaximum of them.
+// An entry of the File menu: "FileMenuHistory.txt" holds lines "PATH,NUMBER", RecentFilesMaximum of
+// them.
 struct RecentFile {
   std::string path;
   int32_t number = 0;  // what the window that opened it makes of it

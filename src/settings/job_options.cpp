@@ -20,7 +20,9 @@ namespace {
 constexpr int32_t kWhole = 100;  // per cent
 constexpr int32_t kFewestGrays = 2, kMostGrays = 256;
 
-Dither DitherFromKey(int32_t value) { return value == 0 ? Dither::None : value == 1 ? Dither::Ordered : Dither::FloydSteinberg; }
+Dither DitherFromKey(int32_t value) {
+  return value == 0 ? Dither::None : value == 1 ? Dither::Ordered : Dither::FloydSteinberg;
+}
 
 }  // namespace
 
@@ -68,9 +70,13 @@ ReduceOptions ReduceOptionsFromSettings() {
 
 ExifTextOptions ExifTextOptionsFromSettings() { return {.showTypes = settings.ExifShowTypes != 0}; }
 
-choice::DistanceUnit DistanceUnitFromSettings() { return settings.ExifDistinceUnits == 0 ? choice::kMiles : choice::kKilometres; }
+choice::DistanceUnit DistanceUnitFromSettings() {
+  return settings.ExifDistinceUnits == 0 ? choice::kMiles : choice::kKilometres;
+}
 
-bool GpsLocationFromSettings(GpsLocation& location) { return ParseGpsLocation(settings.ExifDefaultLocation, location); }
+bool GpsLocationFromSettings(GpsLocation& location) {
+  return ParseGpsLocation(settings.ExifDefaultLocation, location);
+}
 
 HistoryOptions HistoryOptionsFromSettings() {
   return {.on = settings.FileHistoryEnable != 0,

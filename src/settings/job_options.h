@@ -13,15 +13,18 @@ struct ReduceOptions;
 struct ThumbnailOptions;
 struct ThumbnailUpdateOptions;
 
-// What a job needs of the settings in force, as the small structs that its subjects define. Filled once, where a job begins,
-// on the thread that the settings belong to; the job then runs with its own copy, whatever is changed meanwhile.
+// What a job needs of the settings in force, as the small structs that its subjects define. Filled
+// once, where a job begins, on the thread that the settings belong to; the job then runs with its
+// own copy, whatever is changed meanwhile.
 
-// What codecs depend on, by the keys that the structs name. A new key of a codec is one field there and one line here.
+// What codecs depend on, by the keys that the structs name. A new key of a codec is one field there
+// and one line here.
 ReadOptions ReadOptionsFromSettings();
 EncodeOptions EncodeOptionsFromSettings();  // the keys that EncodeOptions names
 
-// FXColorDither and FXMonoDither (other numbers than those of the lists as the last one), FXBidirectional, FXMonomode,
-// FXGrayLevel, FXThreshold, DitherBrightness and DitherContrast, each clamped to its range.
+// FXColorDither and FXMonoDither (other numbers than those of the lists as the last one),
+// FXBidirectional, FXMonomode, FXGrayLevel, FXThreshold, DitherBrightness and DitherContrast, each
+// clamped to its range.
 ReduceOptions ReduceOptionsFromSettings();
 
 // ExifShowTypes.

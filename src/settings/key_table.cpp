@@ -69,7 +69,8 @@ constexpr size_t kLimits[] = {
 
 // Length and last letter of a name: what a search looks at before it compares names.
 constexpr uint16_t TagOf(std::string_view name) {
-  return static_cast<uint16_t>((name.size() << 8) | (name.empty() ? 0 : static_cast<unsigned char>(name.back())));
+  return static_cast<uint16_t>((name.size() << 8) |
+                               (name.empty() ? 0 : static_cast<unsigned char>(name.back())));
 }
 
 constexpr uint16_t kTags[] = {
@@ -85,7 +86,9 @@ constexpr void* VariableOf(FixedText<capacity>& text) {
 constexpr void* VariableOf(int32_t& number) { return &number; }
 
 // A choice has a list, a limited text its limit, no other row an extra word.
-constexpr bool ExtraFits(Kind kind, const void*) { return kind == Kind::Choice || kind == Kind::ValueChoice; }
+constexpr bool ExtraFits(Kind kind, const void*) {
+  return kind == Kind::Choice || kind == Kind::ValueChoice;
+}
 constexpr bool ExtraFits(Kind kind, int32_t limit) {
   return kind == Kind::Prefix ? limit == static_cast<int32_t>(SettingPrefix::Capacity())
                               : limit == 0 && kind != Kind::Choice && kind != Kind::ValueChoice;
@@ -123,7 +126,8 @@ std::string_view TextAt(const void* characters, size_t limit) {
 }  // namespace
 
 constinit const KeyTable keyTable = {{
-#define SETTING(kind, key, control, extra, value) {#key, VariableOf(settings.key), TypeOf(Kind::kind), control, extra},
+#define SETTING(kind, key, control, extra, value) \
+  {#key, VariableOf(settings.key), TypeOf(Kind::kind), control, extra},
 #include "settings/settings.def"
 #undef SETTING
                                      },
@@ -133,7 +137,8 @@ static_assert(offsetof(KeyTable, count) == kKeyCount * sizeof(KeyRow));
 size_t NumberOfKey(const KeyRow& row) {
   const std::less<const KeyRow*> before;
   const bool original = !before(&row, keyTable.rows) && before(&row, keyTable.rows + kKeyCount);
-  const KeyRow* const found = original ? &row : std::ranges::find(keyTable.rows, row.variable, &KeyRow::variable);
+  const KeyRow* const found =
+      original ? &row : std::ranges::find(keyTable.rows, row.variable, &KeyRow::variable);
   return static_cast<size_t>(found - keyTable.rows);
 }
 
@@ -168,7 +173,8 @@ int32_t DefaultNumber(const KeyRow& row) { return *static_cast<const int32_t*>(D
 std::string_view DefaultText(const KeyRow& row) { return TextAt(DefaultOf(row), TextLimit(row)); }
 
 bool IsAtDefault(const KeyRow& row) {
-  return (row.type & KEY_TEXT) != 0 ? TextIn(row) == DefaultText(row) : NumberIn(row) == DefaultNumber(row);
+  return (row.type & KEY_TEXT) != 0 ? TextIn(row) == DefaultText(row)
+                                    : NumberIn(row) == DefaultNumber(row);
 }
 
 size_t TextLimit(const KeyRow& row) { return kLimits[NumberOfKey(row)] - 1; }
@@ -180,7 +186,9 @@ bool HoldsName(const KeyRow& row) {
 
 bool IsLooseFlag(const KeyRow& row) { return kKinds[NumberOfKey(row)] == Kind::LooseFlag; }
 
-void StoreNumber(const KeyRow& row, int32_t number) { *static_cast<int32_t*>(row.variable) = number; }
+void StoreNumber(const KeyRow& row, int32_t number) {
+  *static_cast<int32_t*>(row.variable) = number;
+}
 
 void StoreText(const KeyRow& row, std::string_view text) {
   const size_t limit = TextLimit(row);

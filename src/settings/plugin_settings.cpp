@@ -17,7 +17,8 @@ namespace {
 
 // The key table as modules see it. Its rows have that very layout.
 const FMW_CONFIG_ENTRY* ConfigurationTable() {
-  static_assert(sizeof(FMW_CONFIG_ENTRY) == sizeof(KeyRow) && offsetof(FMW_CONFIG_ENTRY, type) == offsetof(KeyRow, type) &&
+  static_assert(sizeof(FMW_CONFIG_ENTRY) == sizeof(KeyRow) &&
+                offsetof(FMW_CONFIG_ENTRY, type) == offsetof(KeyRow, type) &&
                 offsetof(FMW_CONFIG_ENTRY, extra) == offsetof(KeyRow, extra));
   return static_cast<const FMW_CONFIG_ENTRY*>(static_cast<const void*>(keyTable.rows));
 }

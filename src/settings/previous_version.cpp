@@ -18,7 +18,8 @@ constexpr uint64_t kPiece = uint64_t{1} << 20;  // the thumbnail database may be
 bool MatchesOne(std::string_view name, std::string_view pattern) {
   if (!pattern.starts_with('*')) return EqualIgnoringCase(name, pattern);
   pattern.remove_prefix(1);
-  return name.size() >= pattern.size() && EqualIgnoringCase(name.substr(name.size() - pattern.size()), pattern);
+  return name.size() >= pattern.size() &&
+         EqualIgnoringCase(name.substr(name.size() - pattern.size()), pattern);
 }
 
 bool IsCarried(std::string_view name) {
@@ -70,10 +71,13 @@ CarryOver CarryOverDataFolder(const std::string& previous, const std::string& cu
   bool made = false;
   for (const platform::FolderEntry& entry : *entries) {
     const bool configuration = entry.name == kPreviousConfigurationFile;
-    if (entry.kind != platform::FileKind::Regular || (!configuration && !IsCarried(entry.name))) continue;
+    if (entry.kind != platform::FileKind::Regular || (!configuration && !IsCarried(entry.name)))
+      continue;
     made = made || platform::MakeFolders(current);
     Carry(platform::JoinFolder(previous, entry.name),
-          platform::JoinFolder(current, configuration ? kConfigurationFile : std::string_view(entry.name)), result);
+          platform::JoinFolder(current,
+                               configuration ? kConfigurationFile : std::string_view(entry.name)),
+          result);
   }
   return result;
 }

@@ -20,8 +20,10 @@ std::optional<int32_t> ReadNumber(std::string_view value, ValueSource source) {
   if (source == ValueSource::Person && (value.starts_with("0x") || value.starts_with("0X"))) {
     value.remove_prefix(2);
     int32_t number = 0;
-    const auto [end, error] = std::from_chars(value.data(), value.data() + value.size(), number, 16);
-    if (error != std::errc() || end != value.data() + value.size() || value.starts_with('-')) return std::nullopt;
+    const auto [end, error] =
+        std::from_chars(value.data(), value.data() + value.size(), number, 16);
+    if (error != std::errc() || end != value.data() + value.size() || value.starts_with('-'))
+      return std::nullopt;
     return number;
   }
   return ParseNumber(value);
@@ -36,12 +38,16 @@ bool IsInList(const KeyRow& row, int32_t number) {
 }
 
 ValueFault NumberFault(const KeyRow& row, int32_t number) {
-  if ((row.type & KEY_FLAG) != 0) return IsLooseFlag(row) || number == 0 || number == 1 ? ValueFault::None : ValueFault::NotFlag;
-  if ((row.type & KEY_COLOR) != 0) return number >= 0 && number <= kMostColor ? ValueFault::None : ValueFault::NotColor;
-  if ((row.type & KEY_CHOICE) != 0) return IsInList(row, number) ? ValueFault::None : ValueFault::NotChoice;
+  if ((row.type & KEY_FLAG) != 0)
+    return IsLooseFlag(row) || number == 0 || number == 1 ? ValueFault::None : ValueFault::NotFlag;
+  if ((row.type & KEY_COLOR) != 0)
+    return number >= 0 && number <= kMostColor ? ValueFault::None : ValueFault::NotColor;
+  if ((row.type & KEY_CHOICE) != 0)
+    return IsInList(row, number) ? ValueFault::None : ValueFault::NotChoice;
   if ((row.type & KEY_SPIN) != 0) {
     const SpinRange range = SpinRangeOf(row);
-    return number >= range.minimum && number <= range.maximum ? ValueFault::None : ValueFault::OutOfRange;
+    return number >= range.minimum && number <= range.maximum ? ValueFault::None
+                                                              : ValueFault::OutOfRange;
   }
   return ValueFault::None;
 }
@@ -56,7 +62,8 @@ SettingValue ReadNumberValue(const KeyRow& row, std::string_view text, ValueSour
   }
   value.number = *number;
   value.fault = NumberFault(row, *number);
-  value.usable = value.fault == ValueFault::None || (source == ValueSource::File && value.fault != ValueFault::NotColor);
+  value.usable = value.fault == ValueFault::None ||
+                 (source == ValueSource::File && value.fault != ValueFault::NotColor);
   if (value.fault == ValueFault::NotFlag) value.number = 1;
   return value;
 }
@@ -98,7 +105,8 @@ SettingValue ReadValue(const KeyRow& row, std::string_view value, ValueSource so
     internal.usable = false;
     return internal;
   }
-  return (row.type & KEY_TEXT) != 0 ? ReadTextValue(row, value, source) : ReadNumberValue(row, value, source);
+  return (row.type & KEY_TEXT) != 0 ? ReadTextValue(row, value, source)
+                                    : ReadNumberValue(row, value, source);
 }
 
 void StoreValue(const KeyRow& row, const SettingValue& value) {
@@ -118,7 +126,8 @@ std::string ValueText(const KeyRow& row) {
 }
 
 std::string DefaultValueText(const KeyRow& row) {
-  return (row.type & KEY_TEXT) != 0 ? std::string(DefaultText(row)) : std::to_string(DefaultNumber(row));
+  return (row.type & KEY_TEXT) != 0 ? std::string(DefaultText(row))
+                                    : std::to_string(DefaultNumber(row));
 }
 
 std::string FaultMessage(const KeyRow& row, ValueFault fault) {
@@ -126,17 +135,23 @@ std::string FaultMessage(const KeyRow& row, ValueFault fault) {
     case ValueFault::None: return {};
     case ValueFault::NotNumber: return Tr("%1 takes a whole number.", row.name);
     case ValueFault::NotFlag:
-      return IsLooseFlag(row) ? Tr("%1 takes a whole number.", row.name) : Tr("%1 takes 0 or 1.", row.name);
-    case ValueFault::NotColor: return Tr("%1 takes a color: blue * 65536 + green * 256 + red, or 0xBBGGRR.", row.name);
+      return IsLooseFlag(row) ? Tr("%1 takes a whole number.", row.name)
+                              : Tr("%1 takes 0 or 1.", row.name);
+    case ValueFault::NotColor:
+      return Tr("%1 takes a color: blue * 65536 + green * 256 + red, or 0xBBGGRR.", row.name);
     case ValueFault::NotChoice: return Tr("%1 takes %2.", row.name, ListText(row));
     case ValueFault::OutOfRange: {
       const SpinRange range = SpinRangeOf(row);
       return Tr("%1 takes a number from %2 to %3.", row.name, range.minimum, range.maximum);
     }
-    case ValueFault::TooLong: return Tr("%1 takes at most %2 characters.", row.name, TextLimit(row));
+    case ValueFault::TooLong:
+      return Tr("%1 takes at most %2 characters.", row.name, TextLimit(row));
     case ValueFault::NotText: return Tr("%1 takes no line breaks and no NUL bytes.", row.name);
     case ValueFault::NotName:
-      return Tr("Invalid destination. %1 takes a name, not a path: no \"/\", \"\\\", \"..\" or control characters.", row.name);
+      return Tr(
+          "Invalid destination. %1 takes a name, not a path: no \"/\", \"\\\", \"..\" or control "
+          "characters.",
+          row.name);
     case ValueFault::Internal: return Tr("%1 is an internal value and cannot be set.", row.name);
   }
   return {};

@@ -22,7 +22,8 @@ enum class ValueFault {
   Internal,    // the program's own value
 };
 
-// Where a value comes from. A person is told about every fault. A file is not: what can be used of it is.
+// Where a value comes from. A person is told about every fault. A file is not: what can be used of
+// it is.
 enum class ValueSource { Person, File };
 
 // A value that was read, and what is wrong with it.
@@ -33,9 +34,10 @@ struct SettingValue {
   std::string_view text;  // keys with it; a view into what was read
 };
 
-// Reads a value as it is in the configuration file or on a command line, whole and with its blanks. Numbers are
-// decimal; a person may write 0x. From a file a flag is 1 for any number but 0, a text with a limit is cut to it, and
-// numbers outside their list or range stay, since whoever acts on them must be ready for them anyway.
+// Reads a value as it is in the configuration file or on a command line, whole and with its blanks.
+// Numbers are decimal; a person may write 0x. From a file a flag is 1 for any number but 0, a text
+// with a limit is cut to it, and numbers outside their list or range stay, since whoever acts on
+// them must be ready for them anyway.
 SettingValue ReadValue(const KeyRow& row, std::string_view value, ValueSource source);
 
 // Stores a value that is usable.
@@ -47,7 +49,8 @@ bool HoldsValue(const KeyRow& row, const SettingValue& value);
 std::string ValueText(const KeyRow& row);
 std::string DefaultValueText(const KeyRow& row);  // as the file would say it
 
-// What the key takes, for people: "PngCompression takes a number from 0 to 9." Empty without a fault.
+// What the key takes, for people: "PngCompression takes a number from 0 to 9." Empty without a
+// fault.
 std::string FaultMessage(const KeyRow& row, ValueFault fault);
 
 }  // namespace fotomill

@@ -6,8 +6,8 @@
 
 namespace fotomill {
 
-// The variable type of each kind of key in settings.def. Colors are 0x00BBGGRR. What the numbers of a choice mean is in
-// choice_lists.h.
+// The variable type of each kind of key in settings.def. Colors are 0x00BBGGRR. What the numbers of
+// a choice mean is in choice_lists.h.
 using SettingFlag = int32_t;       // 0 or 1
 using SettingLooseFlag = int32_t;  // a flag whose number is kept as it is
 using SettingSetupFlag = int32_t;  // a flag that windows must follow at once
@@ -26,14 +26,16 @@ using SettingStatusText = FixedText<260>;
 using SettingDestination = FixedText<260>;  // extension of a format that can write
 using SettingPrefix = FixedText<32>;        // a name as well
 
-// Every configuration key as a variable of its own name, at its built-in default until a configuration file is loaded.
+// Every configuration key as a variable of its own name, at its built-in default until a
+// configuration file is loaded.
 struct Settings {
 #define SETTING(kind, key, control, extra, value) Setting##kind key{value};
 #include "settings/settings.def"
 #undef SETTING
 };
 
-// The settings in force. Codecs and processing only read them; they change between jobs, never during one.
+// The settings in force. Codecs and processing only read them; they change between jobs, never
+// during one.
 extern Settings settings;
 // The built-in defaults.
 extern const Settings defaultSettings;

@@ -16,7 +16,8 @@ bool setupChanged = false;
 
 std::vector<std::string> ChoiceTexts(const KeyRow& row) {
   std::vector<std::string> texts;
-  for (const ChoiceEntry* entry = row.extra.choices; entry->text != nullptr; ++entry) texts.emplace_back(Tr(entry->text));
+  for (const ChoiceEntry* entry = row.extra.choices; entry->text != nullptr; ++entry)
+    texts.emplace_back(Tr(entry->text));
   return texts;
 }
 
@@ -24,8 +25,8 @@ int32_t ValueAt(const KeyRow& row, int32_t position) {
   return (row.type & KEY_BY_VALUE) != 0 ? row.extra.choices[position].value : position;
 }
 
-// The place in the list that shows a number; one that is not in the list is shown as the default, and a default that is not
-// as the last entry.
+// The place in the list that shows a number; one that is not in the list is shown as the default,
+// and a default that is not as the last entry.
 int32_t PositionOf(const KeyRow& row, int32_t number) {
   int32_t last = 0, byDefault = -1;
   for (; row.extra.choices[last].text != nullptr; ++last) {
@@ -44,11 +45,13 @@ std::string_view TextOf(const KeyRow& row, SetupValues values) {
 }
 
 int32_t DestinationPosition(std::span<const std::string> extensions, std::string_view wanted) {
-  const auto found = std::ranges::find_if(extensions, [&](const std::string& one) { return EqualIgnoringCase(one, wanted); });
+  const auto found = std::ranges::find_if(
+      extensions, [&](const std::string& one) { return EqualIgnoringCase(one, wanted); });
   return found == extensions.end() ? -1 : static_cast<int32_t>(found - extensions.begin());
 }
 
-void FillDestinations(SetupDialog& dialog, const DestinationSource& destinations, const KeyRow& row, SetupValues values) {
+void FillDestinations(SetupDialog& dialog, const DestinationSource& destinations, const KeyRow& row,
+                      SetupValues values) {
   const std::vector<std::string> extensions = destinations.Extensions();
   dialog.SetChoices(row.control, extensions);
   dialog.Select(row.control, DestinationPosition(extensions, TextOf(row, values)));
@@ -61,7 +64,8 @@ SpinRange RangeIn(const SetupDialog& dialog, const KeyRow& row) {
   return range ? *range : SpinRangeOf(row);
 }
 
-void FillControl(SetupDialog& dialog, const DestinationSource& destinations, const KeyRow& row, SetupValues values) {
+void FillControl(SetupDialog& dialog, const DestinationSource& destinations, const KeyRow& row,
+                 SetupValues values) {
   if ((row.type & KEY_FLAG) != 0) {
     dialog.SetChecked(row.control, NumberOf(row, values) != 0);
   } else if ((row.type & KEY_DESTINATION) != 0) {
@@ -87,7 +91,8 @@ struct ControlValue {
   std::string fault;  // what the key takes instead
 };
 
-// A check box says no more than off or on: a number that means on stays, and on again is what it is by default.
+// A check box says no more than off or on: a number that means on stays, and on again is what it is
+// by default.
 int32_t FlagIn(const SetupDialog& dialog, const KeyRow& row) {
   const bool checked = dialog.IsChecked(row.control);
   if (checked == (NumberIn(row) != 0)) return NumberIn(row);
@@ -97,17 +102,21 @@ int32_t FlagIn(const SetupDialog& dialog, const KeyRow& row) {
 // A choice that still shows what the key's number is shown as has not been touched.
 int32_t ChoiceIn(const SetupDialog& dialog, const KeyRow& row) {
   const int32_t position = dialog.Selected(row.control);
-  return position < 0 || position == PositionOf(row, NumberIn(row)) ? NumberIn(row) : ValueAt(row, position);
+  return position < 0 || position == PositionOf(row, NumberIn(row)) ? NumberIn(row)
+                                                                    : ValueAt(row, position);
 }
 
-std::string DestinationIn(const SetupDialog& dialog, const DestinationSource& destinations, const KeyRow& row) {
+std::string DestinationIn(const SetupDialog& dialog, const DestinationSource& destinations,
+                          const KeyRow& row) {
   const std::vector<std::string> extensions = destinations.Extensions();
   const auto position = static_cast<size_t>(dialog.Selected(row.control));
-  if (position >= extensions.size() || EqualIgnoringCase(extensions[position], TextIn(row))) return std::string(TextIn(row));
+  if (position >= extensions.size() || EqualIgnoringCase(extensions[position], TextIn(row)))
+    return std::string(TextIn(row));
   return extensions[position];
 }
 
-std::string ValueIn(const SetupDialog& dialog, const DestinationSource& destinations, const KeyRow& row) {
+std::string ValueIn(const SetupDialog& dialog, const DestinationSource& destinations,
+                    const KeyRow& row) {
   if ((row.type & KEY_FLAG) != 0) return std::to_string(FlagIn(dialog, row));
   if ((row.type & KEY_DESTINATION) != 0) return DestinationIn(dialog, destinations, row);
   if ((row.type & KEY_CHOICE) != 0) return std::to_string(ChoiceIn(dialog, row));
@@ -115,7 +124,8 @@ std::string ValueIn(const SetupDialog& dialog, const DestinationSource& destinat
   return dialog.Text(row.control);
 }
 
-ControlValue ReadControl(const SetupDialog& dialog, const DestinationSource& destinations, const KeyRow& row) {
+ControlValue ReadControl(const SetupDialog& dialog, const DestinationSource& destinations,
+                         const KeyRow& row) {
   ControlValue control{&row, ValueIn(dialog, destinations, row), {}};
   if (control.text == ValueText(row)) return control;  // whatever it is, it was there before
   const SettingValue value = ReadValue(row, control.text, ValueSource::Person);
@@ -124,7 +134,8 @@ ControlValue ReadControl(const SetupDialog& dialog, const DestinationSource& des
   } else if ((row.type & KEY_SPIN) != 0) {
     const SpinRange range = RangeIn(dialog, row);
     if (value.number < range.minimum || value.number > range.maximum) {
-      control.fault = Tr("%1 takes a number from %2 to %3.", row.name, range.minimum, range.maximum);
+      control.fault =
+          Tr("%1 takes a number from %2 to %3.", row.name, range.minimum, range.maximum);
     }
   }
   return control;
@@ -132,24 +143,28 @@ ControlValue ReadControl(const SetupDialog& dialog, const DestinationSource& des
 
 }  // namespace
 
-void FillSetupDialog(SetupDialog& dialog, const DestinationSource& destinations, std::span<const KeyRow> rows,
-                     SetupValues values) {
+void FillSetupDialog(SetupDialog& dialog, const DestinationSource& destinations,
+                     std::span<const KeyRow> rows, SetupValues values) {
   for (const KeyRow& row : rows) {
     if (row.control != 0 && dialog.Has(row.control)) FillControl(dialog, destinations, row, values);
   }
 }
 
-bool ShowsDefault(const SetupDialog& dialog, const DestinationSource& destinations, const KeyRow& row) {
+bool ShowsDefault(const SetupDialog& dialog, const DestinationSource& destinations,
+                  const KeyRow& row) {
   if ((row.type & KEY_FLAG) != 0) return dialog.IsChecked(row.control) == (DefaultNumber(row) != 0);
   if ((row.type & KEY_DESTINATION) != 0) {
-    return dialog.Selected(row.control) == DestinationPosition(destinations.Extensions(), DefaultText(row));
+    return dialog.Selected(row.control) ==
+           DestinationPosition(destinations.Extensions(), DefaultText(row));
   }
-  if ((row.type & KEY_CHOICE) != 0) return dialog.Selected(row.control) == PositionOf(row, DefaultNumber(row));
+  if ((row.type & KEY_CHOICE) != 0)
+    return dialog.Selected(row.control) == PositionOf(row, DefaultNumber(row));
   if ((row.type & KEY_COLOR) != 0) return dialog.Color(row.control) == DefaultNumber(row);
   return dialog.Text(row.control) == DefaultValueText(row);
 }
 
-std::optional<SetupFault> ReadSetupDialog(const SetupDialog& dialog, const DestinationSource& destinations,
+std::optional<SetupFault> ReadSetupDialog(const SetupDialog& dialog,
+                                          const DestinationSource& destinations,
                                           std::span<const KeyRow> rows) {
   std::vector<ControlValue> controls;
   for (const KeyRow& row : rows) {

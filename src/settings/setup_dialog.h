@@ -12,8 +12,9 @@
 
 namespace fotomill {
 
-// The controls of one Setup dialog, by number. Faces implement it; the binding below says what goes in and what comes out.
-// Texts are bytes, UTF-8 unless the user of an older version chose otherwise.
+// The controls of one Setup dialog, by number. Faces implement it; the binding below says what goes
+// in and what comes out. Texts are bytes, UTF-8 unless the user of an older version chose
+// otherwise.
 class SetupDialog {
  public:
   virtual ~SetupDialog() = default;
@@ -46,12 +47,14 @@ class DestinationSource {
 // Which values controls are filled with.
 enum class SetupValues { InForce, Default };
 
-// Fills every control of the dialog that edits a key with the key's value, its limit, range or choices. With the defaults
-// no key changes until ReadSetupDialog takes them up.
-void FillSetupDialog(SetupDialog& dialog, const DestinationSource& destinations, std::span<const KeyRow> rows = Keys(),
+// Fills every control of the dialog that edits a key with the key's value, its limit, range or
+// choices. With the defaults no key changes until ReadSetupDialog takes them up.
+void FillSetupDialog(SetupDialog& dialog, const DestinationSource& destinations,
+                     std::span<const KeyRow> rows = Keys(),
                      SetupValues values = SetupValues::InForce);
 // Whether the control of a row shows what it would show for the row's default.
-bool ShowsDefault(const SetupDialog& dialog, const DestinationSource& destinations, const KeyRow& row);
+bool ShowsDefault(const SetupDialog& dialog, const DestinationSource& destinations,
+                  const KeyRow& row);
 
 // A control whose value cannot be taken.
 struct SetupFault {
@@ -59,12 +62,15 @@ struct SetupFault {
   std::string message;  // what it takes, a whole sentence
 };
 
-// The dialog's OK: takes up what its controls hold, all or nothing. Returns the first control that holds what its key cannot;
-// then no key has changed. Changed keys are saved by the next SaveConfiguration even if --set gave them.
-std::optional<SetupFault> ReadSetupDialog(const SetupDialog& dialog, const DestinationSource& destinations,
+// The dialog's OK: takes up what its controls hold, all or nothing. Returns the first control that
+// holds what its key cannot; then no key has changed. Changed keys are saved by the next
+// SaveConfiguration even if --set gave them.
+std::optional<SetupFault> ReadSetupDialog(const SetupDialog& dialog,
+                                          const DestinationSource& destinations,
                                           std::span<const KeyRow> rows = Keys());
 
-// To be called when the user changes a control: sets the setup-changed mark when the control's key asks for it.
+// To be called when the user changes a control: sets the setup-changed mark when the control's key
+// asks for it.
 void NoteControlChanged(uint32_t control);
 // The mark: whether windows have to show something else now. Asking clears it.
 bool TakeSetupChanged();

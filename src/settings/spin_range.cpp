@@ -38,7 +38,8 @@ SpinRange SpinRangeOf(const KeyRow& row) {
 }
 
 std::string SpinRangeText(const SpinRange& range) {
-  return std::to_string(range.minimum) + "," + std::to_string(range.maximum) + "," + std::to_string(range.step);
+  return std::to_string(range.minimum) + "," + std::to_string(range.maximum) + "," +
+         std::to_string(range.step);
 }
 
 std::optional<SpinRange> ParseSpinRange(std::string_view text) {

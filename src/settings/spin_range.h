@@ -14,8 +14,8 @@ struct SpinRange {
   int32_t minimum = 0, maximum = 0, step = 1;
 };
 
-// The range of a KEY_SPIN row. Setup dialogs put its text into the control numbered `control` + kSpinRangeControl, from
-// where the binding reads it, so that a dialog may offer less.
+// The range of a KEY_SPIN row. Setup dialogs put its text into the control numbered `control` +
+// kSpinRangeControl, from where the binding reads it, so that a dialog may offer less.
 SpinRange SpinRangeOf(const KeyRow& row);
 // Added to a control's number: the text with its range.
 inline constexpr uint32_t kSpinRangeControl = 10000;

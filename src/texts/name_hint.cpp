@@ -7,7 +7,8 @@ namespace fotomill {
 
 std::string NearestNameHint(std::string_view typed, std::span<const std::string_view> names) {
   const std::string_view nearest = NearestName(typed, names);
-  return nearest.empty() ? std::string() : std::string(" ").append(Tr("Did you mean \"%1\"?", nearest));
+  return nearest.empty() ? std::string()
+                         : std::string(" ").append(Tr("Did you mean \"%1\"?", nearest));
 }
 
 }  // namespace fotomill

@@ -29,10 +29,12 @@ struct {
 constexpr struct {
   const char* code;
   const char* name;
-} kNames[] = {{"de", "Deutsch"}, {"en", "English"}, {"es", "Español"}, {"fr", "Français"}, {"it", "Italiano"},
-              {"ja", "日本語"},  {"nl", "Nederlands"}, {"pl", "Polski"}, {"pt", "Português"}};
+} kNames[] = {{"de", "Deutsch"},    {"en", "English"},  {"es", "Español"},
+              {"fr", "Français"},   {"it", "Italiano"}, {"ja", "日本語"},
+              {"nl", "Nederlands"}, {"pl", "Polski"},   {"pt", "Português"}};
 
-// Catalogs are in the folder "locale" beside the program as it is built, and in share/locale once it is installed.
+// Catalogs are in the folder "locale" beside the program as it is built, and in share/locale once
+// it is installed.
 std::string CatalogFolder() {
   const std::string program = platform::ProgramFolder();
   const std::string beside = platform::JoinFolder(program, "locale");
@@ -41,8 +43,11 @@ std::string CatalogFolder() {
 }
 
 bool HasCatalog(const std::string& folder, const std::string& code) {
-  const bool plain = !code.empty() && std::ranges::all_of(code, [](char c) { return IsLetter(c) || c == '_' || c == '@'; });
-  return plain && platform::FileExists(platform::JoinFolder(folder, code + "/LC_MESSAGES/" + kDomain + ".mo"));
+  const bool plain = !code.empty() && std::ranges::all_of(code, [](char c) {
+    return IsLetter(c) || c == '_' || c == '@';
+  });
+  return plain && platform::FileExists(
+                      platform::JoinFolder(folder, code + "/LC_MESSAGES/" + kDomain + ".mo"));
 }
 
 std::string Variable(const char* name) {
@@ -50,8 +55,8 @@ std::string Variable(const char* name) {
   return value == nullptr ? std::string() : value;
 }
 
-// The languages that the environment asks for, the best first, separated by colons. As in gettext, LANGUAGE counts only
-// where a locale is set.
+// The languages that the environment asks for, the best first, separated by colons. As in gettext,
+// LANGUAGE counts only where a locale is set.
 std::string LanguagesOfSystem() {
   std::string locale = Variable("LC_ALL");
   if (locale.empty()) locale = Variable("LC_MESSAGES");
@@ -61,13 +66,15 @@ std::string LanguagesOfSystem() {
   return languages.empty() ? locale : languages;
 }
 
-// The first language of `wanted` that has a catalog, with or without its country; English if none has.
+// The first language of `wanted` that has a catalog, with or without its country; English if none
+// has.
 std::string ChooseLanguage(std::string_view wanted, const std::string& folder) {
   while (!wanted.empty()) {
     const std::string_view item = wanted.substr(0, wanted.find(':'));
     wanted.remove_prefix(std::min(item.size() + 1, wanted.size()));
     const std::string code(item.substr(0, item.find('.')));
-    const std::string country = code.substr(0, code.find('@')), language = code.substr(0, code.find_first_of("_@"));
+    const std::string country = code.substr(0, code.find('@')),
+                      language = code.substr(0, code.find_first_of("_@"));
     for (const std::string& form : {code, country, language}) {
       if (HasCatalog(folder, form)) return form;
     }
@@ -76,7 +83,8 @@ std::string ChooseLanguage(std::string_view wanted, const std::string& folder) {
   return kEnglish;
 }
 
-// gettext translates only where the locale of messages is not "C". The locale of the language itself need not be installed.
+// gettext translates only where the locale of messages is not "C". The locale of the language
+// itself need not be installed.
 void SetMessageLocale() {
   const char* locale = std::setlocale(LC_MESSAGES, "");
   if (locale == nullptr || std::string_view(locale) == "C" || std::string_view(locale) == "POSIX") {
@@ -106,7 +114,8 @@ bool StartTexts(const std::string& code) {
   const std::string folder = CatalogFolder();
   state.language = ChooseLanguage(code.empty() ? LanguagesOfSystem() : code, folder);
   state.translated = state.language != kEnglish;
-  if (state.translated || !code.empty()) platform::SetVariable("LANGUAGE", state.language);  // toolkits follow it, too
+  // toolkits follow it, too
+  if (state.translated || !code.empty()) platform::SetVariable("LANGUAGE", state.language);
   if (state.translated) {
     SetMessageLocale();
     (void)bindtextdomain(kDomain, folder.c_str());
@@ -124,14 +133,17 @@ std::vector<Language> Languages() {
   if (!entries) return languages;
   for (const auto& entry : *entries) {
     if (entry.name == kEnglish || !HasCatalog(folder, entry.name)) continue;
-    const auto row = std::ranges::find_if(kNames, [&](const auto& name) { return entry.name == name.code; });
+    const auto row =
+        std::ranges::find_if(kNames, [&](const auto& name) { return entry.name == name.code; });
     languages.push_back({entry.name, row == std::end(kNames) ? entry.name : row->name});
   }
   std::ranges::sort(languages.begin() + 1, languages.end(), {}, &Language::name);
   return languages;
 }
 
-const char* Tr(const char* text) { return state.translated && *text != '\0' ? dgettext(kDomain, text) : text; }
+const char* Tr(const char* text) {
+  return state.translated && *text != '\0' ? dgettext(kDomain, text) : text;
+}
 
 std::string ThousandsText(uint64_t number) {
   // Translators: a thousand, with the separator of the language.
@@ -139,7 +151,8 @@ std::string ThousandsText(uint64_t number) {
   std::string text = WithThousands(number);
   if (sample.size() > 4) {
     const std::string separator(sample.substr(1, sample.size() - 4));
-    for (size_t at = text.find(','); at != std::string::npos; at = text.find(',', at + separator.size())) {
+    for (size_t at = text.find(','); at != std::string::npos;
+         at = text.find(',', at + separator.size())) {
       text.replace(at, 1, separator);
     }
   }
@@ -175,9 +188,11 @@ void RecordedText::Append(const RecordedText& more) {
   (shown += ' ') += more.shown;
 }
 
-std::string TrCountArguments(const char* one, const char* many, uint64_t count, std::initializer_list<TextArgument> arguments) {
+std::string TrCountArguments(const char* one, const char* many, uint64_t count,
+                             std::initializer_list<TextArgument> arguments) {
   const char* const english = count == 1 ? one : many;
-  const char* const text = state.translated ? dngettext(kDomain, one, many, static_cast<unsigned long>(count)) : english;
+  const char* const text =
+      state.translated ? dngettext(kDomain, one, many, static_cast<unsigned long>(count)) : english;
   // Scripts read the English lines, so their numbers are plain.
   std::vector<TextArgument> all{state.translated ? ThousandsText(count) : std::to_string(count)};
   all.insert(all.end(), arguments);

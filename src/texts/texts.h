@@ -7,11 +7,11 @@
 #include <string_view>
 #include <vector>
 
-// What people read, in their language. The English text in the source is the id; catalogs of po/ translate it. JSON, data
-// formats, stored texts and names of keys never come through here.
+// What people read, in their language. The English text in the source is the id; catalogs of po/
+// translate it. JSON, data formats, stored texts and names of keys never come through here.
 //
-// %1 to %9 in a text stand for the arguments; a translation may put them in any order. A per cent sign before anything else
-// is one. po/update extracts the texts by the names of these functions.
+// %1 to %9 in a text stand for the arguments; a translation may put them in any order. A per cent
+// sign before anything else is one. po/update extracts the texts by the names of these functions.
 namespace fotomill {
 
 // One argument: a text in UTF-8 or a whole number.
@@ -42,11 +42,14 @@ std::string Tr(const char* text, const Arguments&... arguments) {
   return TrArguments(text, {TextArgument(arguments)...});
 }
 
-// The form of a text that a count asks for. The count is %1, with thousands separated; the arguments follow as %2, ...
-std::string TrCountArguments(const char* one, const char* many, uint64_t count, std::initializer_list<TextArgument> arguments);
+// The form of a text that a count asks for. The count is %1, with thousands separated; the
+// arguments follow as %2, ...
+std::string TrCountArguments(const char* one, const char* many, uint64_t count,
+                             std::initializer_list<TextArgument> arguments);
 // The same with any number of arguments.
 template <typename... Arguments>
-std::string TrCount(const char* one, const char* many, uint64_t count, const Arguments&... arguments) {
+std::string TrCount(const char* one, const char* many, uint64_t count,
+                    const Arguments&... arguments) {
   return TrCountArguments(one, many, count, {TextArgument(arguments)...});
 }
 
@@ -78,8 +81,9 @@ struct Language {
   std::string name;  // in the language itself
 };
 
-// Chooses the language of this run: `code` if it is not empty, else what LANGUAGE, LC_ALL, LC_MESSAGES and LANG ask for, as
-// gettext reads them. English where there is no catalog; false if that is not what `code` asks for. Before other threads run.
+// Chooses the language of this run: `code` if it is not empty, else what LANGUAGE, LC_ALL,
+// LC_MESSAGES and LANG ask for, as gettext reads them. English where there is no catalog; false if
+// that is not what `code` asks for. Before other threads run.
 bool StartTexts(const std::string& code);
 // The language in use, "en" for the source texts.
 const std::string& TextLanguage();

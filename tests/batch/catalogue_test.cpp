@@ -16,7 +16,12 @@ namespace fotomill::test {
 namespace {
 
 TEST(CatalogueDrawing, Places) {
-  CatalogueLook look{.columns = 2, .rows = 3, .cellWidth = 96, .cellHeight = 80, .pageWidth = 301, .pageHeight = 400};
+  CatalogueLook look{.columns = 2,
+                     .rows = 3,
+                     .cellWidth = 96,
+                     .cellHeight = 80,
+                     .pageWidth = 301,
+                     .pageHeight = 400};
   // (301 - 2 x 108 + 12) / 2 and (400 - 3 x 101) / 2
   EXPECT_EQ(CellPlace(look, 0), (Rectangle{48, 48, 96, 80}));
   EXPECT_EQ(CellPlace(look, 3), (Rectangle{156, 149, 96, 80}));
@@ -27,7 +32,9 @@ TEST(CatalogueDrawing, Places) {
       {300, 200, {50, 58, 96, 64}}, {200, 300, {71, 50, 53, 80}}, {12, 10, {50, 50, 96, 80}},
       {48, 10, {50, 80, 96, 20}},   {100000, 1, {50, 89, 96, 1}}, {1, 2147483647, {97, 50, 1, 80}},
   };
-  for (const auto& row : rows) EXPECT_EQ(PicturePlace(look, CellPlace(look, 0), row.width, row.height), row.place) << row.width;
+  for (const auto& row : rows)
+    EXPECT_EQ(PicturePlace(look, CellPlace(look, 0), row.width, row.height), row.place)
+        << row.width;
   look.pageWidth = look.pageHeight = 0;  // the same margin on all sides of the grid
   EXPECT_EQ(PageSize(look), (Rectangle{0, 0, 228, 327}));
   EXPECT_EQ(CellPlace(look, 0), (Rectangle{12, 12, 96, 80}));
@@ -47,13 +54,16 @@ TEST(CatalogueDrawing, FrameAndPicture) {
       PackedImage page;
       ASSERT_EQ(NewCataloguePage(look, page), Status::Ok);
       DrawCell(look, 0, picture->image, {}, nullptr, page);
-      const int32_t flat = black ? 0 : 0xA0A0A0, light = raised ? 0xFFFFFF : flat, dark = raised ? 0x404040 : flat;
+      const int32_t flat = black ? 0 : 0xA0A0A0, light = raised ? 0xFFFFFF : flat,
+                    dark = raised ? 0x404040 : flat;
       const struct {
         int32_t x, y, color;
-      } pixels[] = {{11, 11, 0x102030}, {12, 12, light}, {50, 12, light},     {12, 60, light},     {111, 60, dark},
-                    {50, 95, dark},     {111, 95, dark}, {112, 95, 0x102030}, {111, 96, 0x102030}, {13, 13, 0x102030},
-                    {14, 14, 0},        {109, 93, 0},    {110, 94, 0x102030}};
-      for (const auto& pixel : pixels) EXPECT_EQ(page.PixelAt(pixel.x, pixel.y), pixel.color) << pixel.x << "," << pixel.y;
+      } pixels[] = {{11, 11, 0x102030},  {12, 12, light},    {50, 12, light}, {12, 60, light},
+                    {111, 60, dark},     {50, 95, dark},     {111, 95, dark}, {112, 95, 0x102030},
+                    {111, 96, 0x102030}, {13, 13, 0x102030}, {14, 14, 0},     {109, 93, 0},
+                    {110, 94, 0x102030}};
+      for (const auto& pixel : pixels)
+        EXPECT_EQ(page.PixelAt(pixel.x, pixel.y), pixel.color) << pixel.x << "," << pixel.y;
     }
   }
 }
@@ -79,7 +89,8 @@ TEST(CatalogueDrawing, NamesStayInTheirBand) {
       for (int32_t x = 0; x < page.Width(); ++x) {
         const int32_t pixel = page.PixelAt(x, y);
         if (pixel == 0) continue;
-        left = std::min(left, x), right = std::max(right, x), top = std::min(top, y), bottom = std::max(bottom, y);
+        left = std::min(left, x), right = std::max(right, x), top = std::min(top, y),
+        bottom = std::max(bottom, y);
         gray += pixel != 0xFFFFFF;
       }
     }
@@ -98,7 +109,8 @@ TEST(CataloguePage, FirstFreeNames) {
   BatchJob job = NewBatchJob();
   job.formatIndex = FindFormatByName("x.bmp");
   job.destinationFolder = folder.Path();
-  job.naming.extensionCase = 1;  // is for names that follow a source's, and makes no page replace another
+  // is for names that follow a source's, and makes no page replace another
+  job.naming.extensionCase = 1;
   job.overwrite.prompt = false;
   const PicturePointer page = MakePicture(4, 4, 24);
   std::string path;

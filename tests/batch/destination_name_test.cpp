@@ -34,7 +34,9 @@ class ScriptedPrompts : public Prompts {
   bool ConfirmNewFolder(const std::string&) override { return true; }
 };
 
-int32_t RowOf(std::string_view extension) { return FindFormatByName("x." + std::string(extension)); }
+int32_t RowOf(std::string_view extension) {
+  return FindFormatByName("x." + std::string(extension));
+}
 
 // The outcome in short: the path with "!" in front when it replaces a file, or why there is none.
 std::string Settle(BatchJob& job, const std::set<std::string>& there, const std::string& source) {
@@ -43,17 +45,20 @@ std::string Settle(BatchJob& job, const std::set<std::string>& there, const std:
   destination.path = PlannedDestination(source, {}, {}, job);
   using platform::Existence;
   const TakenTest taken = [&](const std::string& path) {
-    return path.starts_with("unknown") ? Existence::Unknown : there.contains(path) ? Existence::Yes : Existence::No;
+    return path.starts_with("unknown") ? Existence::Unknown
+           : there.contains(path)      ? Existence::Yes
+                                       : Existence::No;
   };
   const VariantMaker variant = [&](std::string& path) {
     return MakeNumberedVariant(path, job.naming.firstVariant, job.naming.lastVariant, taken);
   };
-  if (MakeDestinationName(destination, source, {}, job, taken, variant) == DestinationAnswer::Skip) {
+  if (MakeDestinationName(destination, source, {}, job, taken, variant) ==
+      DestinationAnswer::Skip) {
     FileOutcome outcome;
     if (destination.search != VariantSearch::Found) SayNoName(destination, outcome);
     return destination.search == VariantSearch::AllTaken ? "no variant"
-           : outcome.status == Status::Ok                 ? "skipped"
-                                                          : std::string(StatusMessage(outcome.status));
+           : outcome.status == Status::Ok                ? "skipped"
+                                          : std::string(StatusMessage(outcome.status));
   }
   return (destination.replace ? destination.recycle ? "!~" : "!" : "") + destination.path;
 }

@@ -39,7 +39,8 @@ TEST(Progress, ClosingLines) {
     const size_t before = job.progress.Lines().size();
     job.progress.Finish(job.errors, !job.noSummary, {.closeWhenDone = row.closeWhenDone});
     std::vector<std::string> closing;
-    for (size_t i = before; i < job.progress.Lines().size(); ++i) closing.push_back(job.progress.Lines()[i].text);
+    for (size_t i = before; i < job.progress.Lines().size(); ++i)
+      closing.push_back(job.progress.Lines()[i].text);
     EXPECT_EQ(closing, row.closing);
     EXPECT_EQ(job.progress.IsOpen(), row.open);
     EXPECT_EQ(job.progress.CloseLive() && job.progress.HasScrollBar(), row.open);

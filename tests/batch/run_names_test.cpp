@@ -12,11 +12,13 @@ namespace {
 
 // Files whose names depend on what happens to other files of the run have to wait for those.
 TEST(RunNames, OnlyFilesThatNobodyElseConcernsGoAhead) {
-  using Plan = std::vector<std::pair<const char*, const char*>>;  // sources and outputs; the first one is asked about
+  // sources and outputs; the first one is asked about
+  using Plan = std::vector<std::pair<const char*, const char*>>;
   const struct {
     const char* name;
     Plan plan;
-    bool alone, overwritten;  // nobody else is concerned; another's output may come to lie on the source
+    // nobody else is concerned; another's output may come to lie on the source
+    bool alone, overwritten;
   } rows[] = {
       {"names apart", {{"/x/a.bmp", "/out/a.pcx"}, {"/x/b.bmp", "/out/b.pcx"}}, true, false},
       {"two sources, one output", {{"/x/a.bmp", "/out/a.pcx"}, {"/y/a.bmp", "/out/a.pcx"}}, false, false},

@@ -87,9 +87,12 @@ TEST_F(Run, SeveralAtATimeGiveWhatOneAfterTheOtherGives) {
       job.applyToRest = row.applyToRest;
       ASSERT_EQ(RunBatch(files, {.jobs = jobs}, job), Status::Ok);
       EXPECT_TRUE(job.errors);
-      EXPECT_EQ(job.uses.size(), std::count_if(job.progress.Lines().begin(), job.progress.Lines().end(), [](const auto& line) {
-                  return line.item.file >= 0 && line.item.status == Status::Ok && !line.item.skipped;
-                }));
+      EXPECT_EQ(job.uses.size(), std::count_if(job.progress.Lines().begin(),
+                                               job.progress.Lines().end(), [](const auto& line) {
+                                                 return line.item.file >= 0 &&
+                                                        line.item.status == Status::Ok &&
+                                                        !line.item.skipped;
+                                               }));
       if (jobs == 1) {
         lines = LinesOf(job);
         outputs = Outputs();
@@ -122,7 +125,8 @@ TEST_F(Run, AnOutputThatFailedLeavesItsNameToTheNext) {
   fs::create_directory(In("two"));
   WriteBytes(In("a.bmp"), BitmapFile(70000, 1, 24));  // too wide for JPEG
   WriteBytes(In("two/a.bmp"), BitmapFile(8, 8, 24));
-  const std::vector<BatchFile> files{{In("a.bmp"), {}, Status::Ok, {}}, {In("two/a.bmp"), {}, Status::Ok, {}}};
+  const std::vector<BatchFile> files{{In("a.bmp"), {}, Status::Ok, {}},
+                                     {In("two/a.bmp"), {}, Status::Ok, {}}};
   for (const uint32_t jobs : {1u, 4u}) {
     fs::remove_all(In("out"));
     BatchJob job = NewJob();
@@ -148,12 +152,14 @@ TEST_F(Run, AVariantMayBeTooLongWhereItsNameWasNot) {
 }
 
 TEST_F(Run, ASourceWaitsForTheOutputThatTakesItsPlace) {
-  // Each file's output is the next one's source, and replaces it: the last output holds the first picture.
+  // Each file's output is the next one's source, and replaces it: the last output holds the first
+  // picture.
   for (const uint32_t jobs : {1u, 4u}) {
     fs::remove(In("a [1].bmp"));
     WriteBytes(In("a.dib"), BitmapFile(300, 300, 24));
     WriteBytes(In("a.bmp"), BitmapFile(5, 5, 24));
-    const std::vector<BatchFile> files{{In("a.dib"), {}, Status::Ok, {}}, {In("a.bmp"), {}, Status::Ok, {}}};
+    const std::vector<BatchFile> files{{In("a.dib"), {}, Status::Ok, {}},
+                                       {In("a.bmp"), {}, Status::Ok, {}}};
     BatchJob job = NewJob();
     job.formatIndex = FindFormatByName("x.bmp");
     job.destinationFolder.clear();
@@ -179,7 +185,8 @@ TEST_F(Run, NeverMorePicturesThanJobsAndNothingBegunAfterAbort) {
       most = std::max<int>(most, ++now);
       if (++begun == 20) {
         job.stop.Stop();
-        BatchJob other = NewJob();  // another job, such as the preview of a dialog, has nothing to do with this one's end
+        // another job, such as the preview of a dialog, has nothing to do with this one's end
+        BatchJob other = NewJob();
         EXPECT_EQ(RunBatch({}, {.dryRun = true}, other), Status::Ok);
       }
       std::this_thread::sleep_for(std::chrono::milliseconds(1));
@@ -189,7 +196,8 @@ TEST_F(Run, NeverMorePicturesThanJobsAndNothingBegunAfterAbort) {
     ASSERT_EQ(RunBatch(files, {.transform = transform, .jobs = jobs}, job), Status::Ok);
     EXPECT_LE(most, static_cast<int>(jobs));
     EXPECT_LE(begun, 20 + static_cast<int>(jobs));
-    const auto whole = static_cast<uint32_t>(Outputs().size());  // of the others that were in work, nothing is left
+    // of the others that were in work, nothing is left
+    const auto whole = static_cast<uint32_t>(Outputs().size());
     EXPECT_LE(whole, static_cast<uint32_t>(begun));
     EXPECT_GE(whole + jobs, static_cast<uint32_t>(begun));
     EXPECT_EQ(job.progress.Files(), whole);
@@ -215,7 +223,8 @@ TEST_F(Run, WhateverFailsNoFileIsLost) {
       job.overwrite = {.prompt = false, .recycle = recycle};
       platform::faultCountdown = planned;
       ASSERT_EQ(RunBatch({&file, 1}, {}, job), Status::Ok);
-      const bool there = fs::exists(In("out/a.pcx")), old = there && ReadText(In("out/a.pcx")) == "old";
+      const bool there = fs::exists(In("out/a.pcx")),
+                 old = there && ReadText(In("out/a.pcx")) == "old";
       EXPECT_EQ(job.errors, !there || old);
       EXPECT_EQ(old || (there && !recycle) || (fs::exists(bin) && ReadText(bin) == "old"), true);
       EXPECT_EQ(Outputs().size(), there);

@@ -41,7 +41,8 @@ class Rename : public testing::Test {
   }
   BatchJob RunOn(const std::vector<std::string>& names, const RenameOptions& options) const {
     std::vector<BatchFile> files;
-    for (const std::string& name : names) files.push_back({folder_.Path("p/" + name), {}, Status::Ok, {}});
+    for (const std::string& name : names)
+      files.push_back({folder_.Path("p/" + name), {}, Status::Ok, {}});
     BatchJob job = NewBatchJob();
     RunRename(files, options, job);
     return job;
@@ -155,7 +156,8 @@ TEST_F(Rename, RunsByTheRulesThatItWasStartedWith) {
   const RenameOptions options{.rules = SequentialRenameRulesFromSettings()};
   settings = defaultSettings;
   settings.SequentialRenameBaseName = std::string_view("LATER");
-  settings.SequentialRenameHyphen = settings.SequentialRenameRandom = settings.SequentialRenameSkipCollide = 1;
+  settings.SequentialRenameHyphen = settings.SequentialRenameRandom =
+      settings.SequentialRenameSkipCollide = 1;
   RunOn({"a.jpg", "b.jpg"}, options);
   EXPECT_THAT(There(), ElementsAre("PICTURE0001.jpg=a.jpg", "PICTURE0006.jpg=b.jpg"));
 }
@@ -180,7 +182,8 @@ TEST_F(Rename, TakenBack) {
   EXPECT_TRUE(ReadRenameLog()->files.empty());
 }
 
-// A rename is noted before it is done: a run that is killed in between has either lost nothing or not begun.
+// A rename is noted before it is done: a run that is killed in between has either lost nothing or
+// not begun.
 TEST_F(Rename, KilledRunsCanBeTakenBack) {
   Make({"a.jpg", "b.jpg"});
   const std::string a = folder_.Path("p/a.jpg"), b = folder_.Path("p/b.jpg");
@@ -229,7 +232,8 @@ TEST_F(Rename, RunsAtTheSameTimeAreBothTakenBack) {
   ASSERT_TRUE(UndoRename({}, false, undo));
   EXPECT_FALSE(undo.errors);
   EXPECT_THAT(There(), ElementsAre("a.jpg=a.jpg", "b.jpg=b.jpg"));
-  // A run after them begins a new log; one that goes on while part of it is taken back loses nothing.
+  // A run after them begins a new log; one that goes on while part of it is taken back loses
+  // nothing.
   RenameLog third;
   rename(third, "p/a.jpg", "p/1.jpg");
   rename(third, "p/b.jpg", "p/2.jpg");
@@ -259,7 +263,8 @@ TEST_F(Rename, RandomOrderIsThatOfItsSeed) {
   Make({"a", "b", "c", "d"});
   std::vector<std::string> expected;
   const std::vector<size_t> order = RandomOrder(4, 3);
-  for (size_t i = 0; i < 4; ++i) expected.push_back("PICTURE000" + std::to_string(i + 1) + "=" + "abcd"[order[i]]);
+  for (size_t i = 0; i < 4; ++i)
+    expected.push_back("PICTURE000" + std::to_string(i + 1) + "=" + "abcd"[order[i]]);
   RunOn({"a", "b", "c", "d"}, {.rules = {.random = true}, .seed = 3});
   EXPECT_EQ(There(), expected);
 }

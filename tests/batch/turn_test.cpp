@@ -41,11 +41,13 @@ TEST(Turn, FilesChangeOnlyWhereNothingIsLost) {
       {"c.bmp", BitmapFile(9, 5, 8), nullptr},
       {"d.webp", Encode(WebpWrite, *picture), nullptr},
       {"deep.png",
-       Hex("89504E470D0A1A0A0000000D49484452000000010000000110000000006AEE47160000000B49444154789C6310320100005B004796FB1B"
+       Hex("89504E470D0A1A0A0000000D49484452000000010000000110000000006AEE47160000000B49444154789C6"
+           "310320100005B004796FB1B"
            "650000000049454E44AE426082"),
        "The file has data that would be lost."},
       {"e.gif",
-       Hex("474946383961 0100 0100 800000 000000FFFFFF 2C00000000010001000002024401 00 2C00000000010001000002024C01 00 3B"),
+       Hex("474946383961 0100 0100 800000 000000FFFFFF 2C00000000010001000002024401 00 "
+           "2C00000000010001000002024C01 00 3B"),
        "The file has several pictures; all but one would be lost."},
       {"f.jpg", Hex("FFD8FFD9"), ""},
   };
@@ -70,7 +72,8 @@ TEST(Turn, FilesChangeOnlyWhereNothingIsLost) {
     ASSERT_EQ(LoadPicture({.fileName = folder.Path(std::string("before-") + row.name)}, before), Status::Ok);
     ASSERT_EQ(LoadPicture({.fileName = path}, after), Status::Ok);
     ASSERT_EQ(after->image.Width(), before->image.Height());
-    if (std::string_view(row.name) == "a.jpg") continue;  // decoding a turned block rounds otherwise
+    // decoding a turned block rounds otherwise
+    if (std::string_view(row.name) == "a.jpg") continue;
     for (int32_t x = 0; x < before->image.Width(); ++x) {
       EXPECT_EQ(before->image.PixelAt(x, 1), after->image.PixelAt(after->image.Width() - 2, x));
     }
@@ -86,7 +89,8 @@ TEST(Turn, AFileThatWouldLoseItsTextsStaysAsItIs) {
   const struct {
     const PicturePointer& picture;
     const char* hint;
-  } rows[] = {{commented, "The comment would be lost."}, {tagged, "EXIF, XMP or the color profile would be lost."}};
+  } rows[] = {{commented, "The comment would be lost."},
+              {tagged, "EXIF, XMP or the color profile would be lost."}};
   const std::string path = folder.Path("a.png");
   for (const auto& row : rows) {
     SCOPED_TRACE(row.hint);
@@ -95,8 +99,8 @@ TEST(Turn, AFileThatWouldLoseItsTextsStaysAsItIs) {
     for (const bool kept : {false, true}) {
       settings.PreserveEXIF = kept;
       WriteBytes(path, file);
-      const TurnedFile turned =
-          TurnPictureFile(path, path, {.turn = Orientation::QuarterRight}, {}, {.encode = EncodeOptionsFromSettings()});
+      const TurnedFile turned = TurnPictureFile(path, path, {.turn = Orientation::QuarterRight}, {},
+                                                {.encode = EncodeOptionsFromSettings()});
       EXPECT_EQ(turned.status, kept ? Status::Ok : Status::UnsuitableImage);
       EXPECT_EQ(turned.hint, kept ? "" : row.hint);
       EXPECT_EQ(ReadBytes(path) == file, !kept);
@@ -127,7 +131,8 @@ TEST(Turn, SelectionsKeepTheirNamesAndTheirOldFiles) {
   EXPECT_TRUE(fs::is_symlink(folder.Path("link.bmp")));
   EXPECT_EQ(ReadBytes(folder.Path("c.bmp")), bitmap);
 
-  // Elsewhere outputs keep clear of each other and of what is there; the second turn gives the first picture back.
+  // Elsewhere outputs keep clear of each other and of what is there; the second turn gives the
+  // first picture back.
   function = {.request = {.turn = Orientation::HalfTurn}};
   BatchJob other;
   other.destinationFolder = folder.Path("out");
@@ -147,7 +152,8 @@ TEST(Turn, WhateverFailsTheOldFileIsThere) {
   const std::vector<uint8_t> file = Encode(JpegWrite, *PatternPicture(32, 16, 24));
   const int64_t faults = ForEachFault([&] {
     WriteBytes(path, file);
-    const Status status = TurnPictureFile(path, path, {.turn = Orientation::HalfTurn}, {}, {}).status;
+    const Status status =
+        TurnPictureFile(path, path, {.turn = Orientation::HalfTurn}, {}, {}).status;
     EXPECT_EQ(ReadBytes(path) == file, status != Status::Ok);
     EXPECT_EQ(folder.Names().size(), 1u);
   });

@@ -52,8 +52,8 @@ class FileHistory : public testing::Test {
     std::vector<std::string> list;
     for (size_t i = 0; i < FileHistoryCount(); ++i) {
       const FileHistoryEntry entry = FileHistoryAt(i);
-      list.push_back(std::string(entry.path.substr(folder_.Path().size() + 1)) + " " + std::to_string(entry.function) + " " +
-                     std::to_string(entry.accessed - kNow));
+      list.push_back(std::string(entry.path.substr(folder_.Path().size() + 1)) + " " +
+                     std::to_string(entry.function) + " " + std::to_string(entry.accessed - kNow));
     }
     return list;
   }
@@ -68,7 +68,8 @@ class FileHistory : public testing::Test {
 };
 
 bool Record(const std::string& path, int function, int64_t before, int32_t created = kOwnTime) {
-  return RecordFileHistory(HistoryOptionsFromSettings(), path, static_cast<FileFunction>(function), created, static_cast<int32_t>(kNow - before));
+  return RecordFileHistory(HistoryOptionsFromSettings(), path, static_cast<FileFunction>(function),
+                           created, static_cast<int32_t>(kNow - before));
 }
 
 TEST_F(FileHistory, RefreshesAnEntryAndKeepsItsSizeAndBirth) {
@@ -82,7 +83,8 @@ TEST_F(FileHistory, RefreshesAnEntryAndKeepsItsSizeAndBirth) {
 }
 
 TEST_F(FileHistory, SortsByTimeThenBackwardsByNameThenPath) {
-  for (const char* name : {"x/b.bmp", "b.jpg", "x/c.bmp", "b.bmp", "y/b.bmp", "a"}) EXPECT_TRUE(Record(File(name), 0, 5));
+  for (const char* name : {"x/b.bmp", "b.jpg", "x/c.bmp", "b.bmp", "y/b.bmp", "a"})
+    EXPECT_TRUE(Record(File(name), 0, 5));
   EXPECT_TRUE(Record(File("late"), 0, 4));
   EXPECT_TRUE(Record(File("early"), 0, 6));
   EXPECT_TRUE(Record(folder_.Path("a"), 0, 3));
@@ -117,7 +119,8 @@ TEST_F(FileHistory, RefusesWhatItCannotKeep) {
   const std::string a = File("a");
   std::filesystem::create_directory(folder_.Path("folder"));
   std::string deep = folder_.Path();
-  while (deep.size() < 200) deep += "/" + std::string(std::min<size_t>(50, 261 - deep.size() - 2), 'd');
+  while (deep.size() < 200)
+    deep += "/" + std::string(std::min<size_t>(50, 261 - deep.size() - 2), 'd');
   std::filesystem::create_directories(deep);
   const std::string fits = deep + "/" + std::string(260 - deep.size() - 1, 'f');
   const struct {
@@ -249,7 +252,8 @@ TEST_F(FileHistory, GrowsWithoutTouchingWhatItReserves) {
   getrusage(RUSAGE_SELF, &after);
   EXPECT_EQ(recorded, 300);
   ASSERT_EQ(FileHistoryCount(), 300u);
-  for (size_t i = 1; i < 300; ++i) EXPECT_GE(FileHistoryAt(i - 1).accessed, FileHistoryAt(i).accessed);
+  for (size_t i = 1; i < 300; ++i)
+    EXPECT_GE(FileHistoryAt(i - 1).accessed, FileHistoryAt(i).accessed);
 #ifndef __SANITIZE_ADDRESS__  // the sanitizer keeps books of what is reserved, in memory of its own
   EXPECT_LT(after.ru_maxrss - before.ru_maxrss, 4 * 1024) << "kilobytes";
 #endif
@@ -291,7 +295,8 @@ TEST_F(FileHistory, FaultsLoseNothingThatWasThere) {
   const int64_t faults = ForEachFault([&] {
     WriteText(Store(), old);
     size_t recorded = 0;
-    const HistoryUpdate result = UpdateFileHistory(HistoryOptionsFromSettings(), {&second, 1}, &recorded);
+    const HistoryUpdate result =
+        UpdateFileHistory(HistoryOptionsFromSettings(), {&second, 1}, &recorded);
     const int64_t left = platform::faultCountdown.exchange(0);
     const std::vector<std::string> stored = Stored();
     if (result == HistoryUpdate::Done && recorded == 1) {
@@ -311,7 +316,8 @@ TEST_F(FileHistory, TwoProcessesKeepEachOthersEntries) {
   const auto recordHalf = [&](size_t from) {
     for (size_t i = from; i < files.size(); i += 2) {
       const FileUse use{files[i], FileFunction::View};
-      if (UpdateFileHistory(HistoryOptionsFromSettings(), {&use, 1}) != HistoryUpdate::Done) _exit(1);
+      if (UpdateFileHistory(HistoryOptionsFromSettings(), {&use, 1}) != HistoryUpdate::Done)
+        _exit(1);
     }
   };
   const pid_t child = fork();
@@ -335,7 +341,9 @@ TEST_F(FileHistory, AFullDiskLeavesTheOldFile) {
     signal(SIGXFSZ, SIG_IGN);
     const rlimit limit{10, 10};
     setrlimit(RLIMIT_FSIZE, &limit);
-    _exit(UpdateFileHistory(HistoryOptionsFromSettings(), {&second, 1}) == HistoryUpdate::Failed ? 0 : 1);
+    _exit(UpdateFileHistory(HistoryOptionsFromSettings(), {&second, 1}) == HistoryUpdate::Failed
+              ? 0
+              : 1);
   });
   EXPECT_EQ(status, 0);
   EXPECT_EQ(ReadText(Store()), old);

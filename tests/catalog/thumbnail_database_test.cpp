@@ -40,13 +40,14 @@ class Database : public testing::Test {
     ThumbnailDatabase database;
     DatabaseHeader header;
     std::vector<std::string> records;
-    if (database.OpenThumbnailDatabase(Path(), false) != Opened::Done || !database.ReadDatabaseHeader(header))
+    if (database.OpenThumbnailDatabase(Path(), false) != Opened::Done ||
+        !database.ReadDatabaseHeader(header))
       return {"unreadable"};
     for (int64_t i = 0; i < database.RecordCount(header); ++i) {
       DatabaseRecord record;
       if (!database.ReadDatabaseRecord(i, record)) return {"broken"};
-      records.push_back(record.path + " " + record.volume + " " + std::to_string(record.thumbnail.bytes[300]) +
-                        (record.deleted ? " x" : ""));
+      records.push_back(record.path + " " + record.volume + " " +
+                        std::to_string(record.thumbnail.bytes[300]) + (record.deleted ? " x" : ""));
     }
     return records;
   }
@@ -62,8 +63,8 @@ DatabaseRecord Record(const std::string& path, const std::string& volume, uint8_
   return record;
 }
 
-bool Append(ThumbnailDatabase& database, const std::string& path, const std::string& volume, uint8_t pixel,
-            bool replace = false) {
+bool Append(ThumbnailDatabase& database, const std::string& path, const std::string& volume,
+            uint8_t pixel, bool replace = false) {
   const DatabaseRecord record = Record(path, volume, pixel);
   return database.AppendDatabaseRecords({&record, 1}, replace);
 }
@@ -83,7 +84,9 @@ TEST_F(Database, IsLaidOutToTheByte) {
   ASSERT_EQ(bytes.size(), 28502u);
   EXPECT_EQ(bytes[12], 1);
   EXPECT_EQ(bytes[24], 1);
-  const auto part = [&](size_t from, size_t count) { return std::string(bytes.begin() + from, bytes.begin() + from + count); };
+  const auto part = [&](size_t from, size_t count) {
+    return std::string(bytes.begin() + from, bytes.begin() + from + count);
+  };
   EXPECT_EQ(part(60, 4), "THNL");
   EXPECT_EQ(part(60 + 27912, 261), "/a" + std::string(259, '\0'));
   EXPECT_EQ(part(60 + 28173, 261), "PHOTOS:12345" + std::string(249, '\0'));
@@ -119,7 +122,8 @@ TEST_F(Database, NamesVolumes) {
   }
 }
 
-// Every lookup gives what a scan from the first record gives, whatever happened before, also through another handle.
+// Every lookup gives what a scan from the first record gives, whatever happened before, also
+// through another handle.
 TEST_F(Database, FindsWhatAScanFinds) {
   ThumbnailDatabase one, two;
   ASSERT_EQ(one.OpenThumbnailDatabase(Path(), true), Opened::Done);
@@ -134,12 +138,14 @@ TEST_F(Database, FindsWhatAScanFinds) {
   for (int step = 0; step < 400; ++step) {
     SCOPED_TRACE(step);
     ThumbnailDatabase& database = random() % 2 ? one : two;
-    const std::string path = "/p" + std::to_string(random() % 6), volume = "v" + std::to_string(random() % 2);
+    const std::string path = "/p" + std::to_string(random() % 6),
+                      volume = "v" + std::to_string(random() % 2);
     const auto pixel = static_cast<uint8_t>(step);
     switch (random() % 9) {
       case 0: {
         int64_t count = 0;
-        for (Row& row : model) count += row.path == path && !std::exchange(row.deleted, row.deleted || row.path == path);
+        for (Row& row : model)
+          count += row.path == path && !std::exchange(row.deleted, row.deleted || row.path == path);
         EXPECT_EQ(database.Delete(path), count);
         break;
       }
@@ -153,7 +159,8 @@ TEST_F(Database, FindsWhatAScanFinds) {
       case 3: {
         const bool replace = random() % 2;
         ASSERT_TRUE(Append(database, path, volume, pixel, replace));
-        for (Row& row : model) row.deleted = row.deleted || (replace && row.path == path && row.volume == volume);
+        for (Row& row : model)
+          row.deleted = row.deleted || (replace && row.path == path && row.volume == volume);
         model.push_back({path, volume, pixel});
         break;
       }
@@ -166,12 +173,14 @@ TEST_F(Database, FindsWhatAScanFinds) {
         break;
       default: break;
     }
-    // A handle on a database that was compacted through another one is opened again by its next change.
+    // A handle on a database that was compacted through another one is opened again by its next
+    // change.
     ThumbnailDatabase fresh;
     ASSERT_EQ(fresh.OpenThumbnailDatabase(Path(), false), Opened::Done);
     ThumbnailRecord found;
-    const auto wanted =
-        std::ranges::find_if(model, [&](const Row& row) { return !row.deleted && row.path == path && row.volume == volume; });
+    const auto wanted = std::ranges::find_if(model, [&](const Row& row) {
+      return !row.deleted && row.path == path && row.volume == volume;
+    });
     ASSERT_EQ(fresh.Find(path, volume, found), wanted != model.end());
     if (wanted != model.end()) {
       ASSERT_EQ(found.bytes[300], wanted->pixel);
@@ -213,13 +222,17 @@ TEST_F(Database, ASavedIndexIsOnlyAHelp) {
   constexpr int kMany = 1200;
   const std::string index = Path() + ".index";
   std::vector<DatabaseRecord> records;
-  for (int i = 0; i < kMany; ++i) records.push_back(Record("/p/" + std::to_string(i), "v", static_cast<uint8_t>(i)));
-  const auto open = [&](ThumbnailDatabase& database) { return database.OpenThumbnailDatabase(Path(), true) == Opened::Done; };
+  for (int i = 0; i < kMany; ++i)
+    records.push_back(Record("/p/" + std::to_string(i), "v", static_cast<uint8_t>(i)));
+  const auto open = [&](ThumbnailDatabase& database) {
+    return database.OpenThumbnailDatabase(Path(), true) == Opened::Done;
+  };
   const auto finds = [&](int number) {
     ThumbnailDatabase database;
     ThumbnailRecord found;
     const auto find = [&] {
-      return database.Find("/p/" + std::to_string(number), "v", found) && found.bytes[300] == number % 256;
+      return database.Find("/p/" + std::to_string(number), "v", found) &&
+             found.bytes[300] == number % 256;
     };
     if (!open(database)) return false;
     const bool inFile = find();  // the second time with all of it loaded
@@ -236,7 +249,8 @@ TEST_F(Database, ASavedIndexIsOnlyAHelp) {
   EXPECT_TRUE(finds(0) && finds(kMany - 1) && !finds(kMany));
   EXPECT_EQ(ReadBytes(index), good);
   std::vector<uint8_t> bad = good;
-  for (size_t cell = 48; cell < bad.size(); cell += 8) bad[cell] ^= (cell - 48) % 512 != 0;  // every hash, no checksum
+  // every hash, no checksum
+  for (size_t cell = 48; cell < bad.size(); cell += 8) bad[cell] ^= (cell - 48) % 512 != 0;
   WriteBytes(index, bad);
   EXPECT_TRUE(finds(7));
   EXPECT_EQ(ReadBytes(index), good) << "made anew";
@@ -261,7 +275,9 @@ TEST(ThumbnailIndex, KnowsEveryRecordInOrderThroughChanges) {
   std::vector<uint32_t> model;
   std::mt19937 random(3);
   // Few hashes, and some that share a home, so that searches run into one another.
-  const auto hash = [&] { return random() % 3 == 0 ? 0 : static_cast<uint32_t>(random() % 40 + 1) << (random() % 2 * 27); };
+  const auto hash = [&] {
+    return random() % 3 == 0 ? 0 : static_cast<uint32_t>(random() % 40 + 1) << (random() % 2 * 27);
+  };
   for (int step = 0; step < 4000; ++step) {
     if (random() % 3 != 0 || model.empty()) {
       model.push_back(hash());
@@ -341,7 +357,9 @@ TEST_F(Database, LeavesAloneWhatItCannotRead) {
 TEST_F(Database, PurgesOnlyWhereItCanTell) {
   static platform::DriveKind kind;
   static std::string label;
-  platform::ReplaceVolumeFunction([](const std::string&) { return platform::Volume{true, label, 1, kind}; });
+  platform::ReplaceVolumeFunction([](const std::string&) {
+    return platform::Volume{true, label, 1, kind};
+  });
   const struct {
     const char* name;
     platform::DriveKind kind;
@@ -379,7 +397,8 @@ TEST_F(Database, FaultsLoseNoRecord) {
   int64_t faults = ForEachFault([&] {
     WriteBytes(Path(), start);
     ThumbnailDatabase odd;
-    const bool added = odd.OpenThumbnailDatabase(Path(), true) == Opened::Done && Append(odd, "/a", "v", 3, true);
+    const bool added =
+        odd.OpenThumbnailDatabase(Path(), true) == Opened::Done && Append(odd, "/a", "v", 3, true);
     const int64_t left = platform::faultCountdown.exchange(0);
     const std::vector<std::string> records = Records();
     ASSERT_GE(records.size(), 2u);
@@ -396,8 +415,8 @@ TEST_F(Database, FaultsLoseNoRecord) {
   faults = ForEachFault([&] {
     WriteBytes(Path(), start);
     ThumbnailDatabase odd;
-    const bool done =
-        odd.OpenThumbnailDatabase(Path(), false) == Opened::Done && odd.CompactThumbnailDatabase(false) == Compacted::Done;
+    const bool done = odd.OpenThumbnailDatabase(Path(), false) == Opened::Done &&
+                      odd.CompactThumbnailDatabase(false) == Compacted::Done;
     const int64_t left = platform::faultCountdown.exchange(0);
     if (done) {
       EXPECT_THAT(Records(), ElementsAre("/a v 1"));
@@ -433,7 +452,8 @@ TEST_F(Database, TwoProcessesAppendAndCompact) {
   EXPECT_EQ(Records().size(), 2u * kEach);
 }
 
-// Records whose append was reported are there, and the database is readable, whenever the writer is killed.
+// Records whose append was reported are there, and the database is readable, whenever the writer is
+// killed.
 TEST_F(Database, AKilledWriterLosesNothingReported) {
   for (int round = 0; round < 12; ++round) {
     int reported[2];
@@ -445,7 +465,8 @@ TEST_F(Database, AKilledWriterLosesNothingReported) {
       ThumbnailDatabase database;
       if (database.OpenThumbnailDatabase(Path(), true) != Opened::Done) _exit(1);
       for (int i = 0;; ++i) {
-        if (!Append(database, "/" + std::to_string(round) + "-" + std::to_string(i), "v", 1)) _exit(2);
+        if (!Append(database, "/" + std::to_string(round) + "-" + std::to_string(i), "v", 1))
+          _exit(2);
         if (write(reported[1], "x", 1) != 1) _exit(3);
         if (i % 5 == 4 && database.CompactThumbnailDatabase(false) != Compacted::Done) _exit(4);
       }
@@ -477,7 +498,9 @@ TEST_F(Database, AFullDiskFailsAndCountsNothing) {
     const rlimit limit{40000, 40000};
     setrlimit(RLIMIT_FSIZE, &limit);
     ThumbnailDatabase full;
-    _exit(full.OpenThumbnailDatabase(Path(), true) == Opened::Done && !Append(full, "/b", "v", 2) ? 0 : 1);
+    _exit(full.OpenThumbnailDatabase(Path(), true) == Opened::Done && !Append(full, "/b", "v", 2)
+              ? 0
+              : 1);
   });
   EXPECT_EQ(status, 0);
   EXPECT_THAT(Records(), ElementsAre("/a v 1"));

@@ -36,7 +36,8 @@ PackedImage Canvas(int32_t side) {
 
 TEST(DrawThumbnail, FillsTheSquareOfItsFlags) {
   ThumbnailRecord record = Flat(0);
-  for (int32_t i = 0; i < 3; ++i) {  // two white pixels in the top left corner, one in the bottom right
+  // two white pixels in the top left corner, one in the bottom right
+  for (int32_t i = 0; i < 3; ++i) {
     record.StoredRow(95)[i] = record.StoredRow(94)[3 + i] = record.StoredRow(0)[95 * 3 + i] = 255;
   }
   LargeThumbnailRecord large;
@@ -131,27 +132,30 @@ class Lookup : public testing::Test {
   }
 
   // Puts a PNG of 200 x 100 (or as given) with its texts where the system keeps its thumbnails.
-  void PutSystemThumbnail(int64_t late, const std::string& uri, int32_t width = 200, int32_t height = 100) const {
+  void PutSystemThumbnail(int64_t late, const std::string& uri, int32_t width = 200,
+                          int32_t height = 100) const {
     std::vector<uint8_t> file = Encode(PngWrite, *PatternPicture(width, height, 24));
     struct stat facts;
     ASSERT_EQ(stat(picture_.c_str(), &facts), 0);
     InsertText(file, std::string("Thumb::URI") + '\0' + uri);
     InsertText(file, std::string("Thumb::MTime") + '\0' + std::to_string(facts.st_mtime + late));
     const std::string name = FileUri(picture_);
-    WriteBytes(
-        folder_.Path("cache/thumbnails/large/" + Md5Text({reinterpret_cast<const uint8_t*>(name.data()), name.size()}) + ".png"),
-        file);
+    WriteBytes(folder_.Path("cache/thumbnails/large/" +
+                            Md5Text({reinterpret_cast<const uint8_t*>(name.data()), name.size()}) +
+                            ".png"),
+               file);
   }
   static void InsertText(std::vector<uint8_t>& file, const std::string& text) {
     std::string chunk = "tEXt" + text;
     const auto number = [](uint32_t value) {
-      return std::vector<uint8_t>{static_cast<uint8_t>(value >> 24), static_cast<uint8_t>(value >> 16),
+      return std::vector<uint8_t>{static_cast<uint8_t>(value >> 24),
+                                  static_cast<uint8_t>(value >> 16),
                                   static_cast<uint8_t>(value >> 8), static_cast<uint8_t>(value)};
     };
     std::vector<uint8_t> bytes = number(static_cast<uint32_t>(text.size()));
     bytes.insert(bytes.end(), chunk.begin(), chunk.end());
-    const std::vector<uint8_t> crc =
-        number(static_cast<uint32_t>(crc32(0, reinterpret_cast<const Bytef*>(chunk.data()), static_cast<uInt>(chunk.size()))));
+    const std::vector<uint8_t> crc = number(static_cast<uint32_t>(
+        crc32(0, reinterpret_cast<const Bytef*>(chunk.data()), static_cast<uInt>(chunk.size()))));
     bytes.insert(bytes.end(), crc.begin(), crc.end());
     file.insert(file.begin() + 33, bytes.begin(), bytes.end());  // behind the header chunk
   }
@@ -187,7 +191,8 @@ TEST_F(Lookup, TakesTheSystemsThumbnailWhileItIsValid) {
   // Screens with more pixels ask for more.
   EXPECT_NE(ReadSystemPicture(picture_, 256), nullptr);
   EXPECT_EQ(ReadSystemPicture(picture_, 257), nullptr);
-  std::filesystem::copy(folder_.Path("cache/thumbnails/large"), folder_.Path("cache/thumbnails/x-large"));
+  std::filesystem::copy(folder_.Path("cache/thumbnails/large"),
+                        folder_.Path("cache/thumbnails/x-large"));
   EXPECT_NE(ReadSystemPicture(picture_, 257), nullptr);
   PutSystemThumbnail(0, FileUri(picture_), 100);
   ASSERT_TRUE(ReadSystemThumbnail(picture_, 0xabcdef, record));
@@ -226,9 +231,12 @@ TEST_F(Lookup, AsksWhereTheModeSays) {
     std::filesystem::remove(ThumbnailPathFor(picture_));
     ThumbnailRecord file = Flat(1);
     ASSERT_TRUE(!row.hasFile || WriteThumbnailFile(file, ThumbnailPathFor(picture_), true));
-    const ThumbnailOptions options{.fromFiles = row.alwaysFile != 0, .fromSystem = row.useCache != 0};
-    ThumbnailSources sources{row.mode, true, [&](std::string_view name) { return name == "a b.bmp" ? &listed : nullptr; },
-                             &database, options};
+    const ThumbnailOptions options{.fromFiles = row.alwaysFile != 0,
+                                   .fromSystem = row.useCache != 0};
+    ThumbnailSources sources{
+        row.mode, true,
+        [&](std::string_view name) { return name == "a b.bmp" ? &listed : nullptr; }, &database,
+        options};
     const auto record = std::make_unique<AnyThumbnailRecord>();
     ASSERT_EQ(LookUpThumbnail(picture_, row.large, sources, *record), row.found != kNone);
     const bool large = std::holds_alternative<LargeThumbnailRecord>(*record);

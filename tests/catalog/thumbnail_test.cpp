@@ -26,7 +26,8 @@ constexpr Color kMatte = 0x332211;  // red 0x11, green 0x22, blue 0x33
 PicturePointer Plain(int32_t width, int32_t height, uint8_t blue, uint8_t green, uint8_t red) {
   PicturePointer picture = MakePicture(width, height, 24);
   for (int32_t y = 0; y < height; ++y) {
-    for (int32_t x = 0; x < width; ++x) SetPixel(picture->image, x, y, red << 16 | green << 8 | blue);
+    for (int32_t x = 0; x < width; ++x)
+      SetPixel(picture->image, x, y, red << 16 | green << 8 | blue);
   }
   return picture;
 }
@@ -45,8 +46,10 @@ TEST(ThumbnailRecord, IsLaidOutToTheByte) {
   ASSERT_TRUE(MakeThumbnailRecord(record, *Plain(10, 20, 1, 2, 3), {.matte = kMatte}));
   std::vector<uint8_t> wanted = Hex("54 48 4E 4C   # THNL\n 00 02  # version 512");
   wanted.resize(264);                                                            // reserved
-  for (int i = 0; i < 24; ++i) wanted.insert(wanted.end(), {0x33, 0x22, 0x11});  // blue, green, red of the matte
-  wanted.insert(wanted.end(), {1, 2, 3});                                        // the picture, 48 x 96, from column 24 on
+  // blue, green, red of the matte
+  for (int i = 0; i < 24; ++i) wanted.insert(wanted.end(), {0x33, 0x22, 0x11});
+  // the picture, 48 x 96, from column 24 on
+  wanted.insert(wanted.end(), {1, 2, 3});
   EXPECT_EQ(Head(record, wanted.size()), wanted);
 }
 
@@ -55,7 +58,8 @@ TEST(ThumbnailRecord, PlacesPicturesInTheMiddle) {
     const char* name;
     int32_t width, height;
     int32_t quick;
-    int32_t left, bottom, right, top;  // first and last pixel of the picture in the square, rows from the bottom
+    // first and last pixel of the picture in the square, rows from the bottom
+    int32_t left, bottom, right, top;
   } rows[] = {
       {"the quick scaler's percentage", 48, 200, 1, 36, 0, 58, 95},
       {"filtered", 48, 200, 0, 36, 0, 58, 95},
@@ -71,7 +75,8 @@ TEST(ThumbnailRecord, PlacesPicturesInTheMiddle) {
     for (int32_t r = 0; r < 96; ++r) {
       for (int32_t x = 0; x < 96; ++x) {
         const bool inside = x >= row.left && x <= row.right && r >= row.bottom && r <= row.top;
-        const std::vector<uint8_t> wanted = inside ? std::vector<uint8_t>{200, 100, 50} : std::vector<uint8_t>{0x33, 0x22, 0x11};
+        const std::vector<uint8_t> wanted =
+            inside ? std::vector<uint8_t>{200, 100, 50} : std::vector<uint8_t>{0x33, 0x22, 0x11};
         ASSERT_EQ(PixelOf(record, x, r), wanted) << x << ", " << r;
       }
     }
@@ -95,7 +100,9 @@ TEST(ThumbnailRecord, IsTheSameFromAReducedDecode) {
   PicturePointer picture = MakePicture(1601, 1603, 24);
   for (int32_t y = 0; y < 1603; ++y) {
     for (int32_t x = 0; x < 1601; ++x) {
-      const auto wave = [](int32_t at) { return static_cast<int32_t>(128 + 100 * std::sin(at * 0.06)); };
+      const auto wave = [](int32_t at) {
+        return static_cast<int32_t>(128 + 100 * std::sin(at * 0.06));
+      };
       SetPixel(picture->image, x, y, wave(x) << 16 | wave(y) << 8);
     }
   }
@@ -216,7 +223,8 @@ class ThumbsCommand : public testing::Test {
     for (const json& element : json::parse(RunCommand({"thumbs", "list", In(""), "--json"}).out)) {
       const std::string file = element["file"];
       const std::string name = file.empty() ? element["thumbnail"] : element["file"];
-      list.push_back(element["status"].get<std::string>() + " " + std::filesystem::path(name).filename().string());
+      list.push_back(element["status"].get<std::string>() + " " +
+                     std::filesystem::path(name).filename().string());
     }
     return list;
   }
@@ -232,7 +240,8 @@ TEST_F(ThumbsCommand, MakesWhatIsMissingAndCleansWhatIsLeft) {
   std::filesystem::create_directory(In("folder.THN"));
   std::filesystem::create_symlink(In("a.bmp"), In("link.THN"));
   EXPECT_EQ(RunCommand({"thumbs", "make", In("c.bmp")}).status, 0);
-  std::filesystem::last_write_time(In("c.bmp"), std::filesystem::last_write_time(In("c.THN")) + std::chrono::seconds(5));
+  std::filesystem::last_write_time(
+      In("c.bmp"), std::filesystem::last_write_time(In("c.THN")) + std::chrono::seconds(5));
   EXPECT_THAT(List(), ElementsAre("missing a.bmp", "broken b.bmp", "missing bad.bmp", "stale c.bmp", "orphan gone.thn"));
   EXPECT_THAT(RunCommand({"thumbs", "make", In(""), "--dry-run"}).out, testing::HasSubstr("a.bmp -> "));
   EXPECT_FALSE(std::filesystem::exists(In("a.THN")));
@@ -256,8 +265,8 @@ TEST_F(ThumbsCommand, MakesWhatIsMissingAndCleansWhatIsLeft) {
 
   EXPECT_EQ(RunCommand({"thumbs", "clean", In(""), "-n"}).out, In("gone.thn") + "\n");
   EXPECT_EQ(RunCommand({"thumbs", "clean", In("")}).status, 0);
-  EXPECT_THAT(folder_.Names(),
-              ElementsAre(".dot.THN", "a.THN", "a.bmp", "b.THN", "b.bmp", "bad.bmp", "c.THN", "c.bmp", "folder.THN", "link.THN"));
+  EXPECT_THAT(folder_.Names(), ElementsAre(".dot.THN", "a.THN", "a.bmp", "b.THN", "b.bmp",
+                                           "bad.bmp", "c.THN", "c.bmp", "folder.THN", "link.THN"));
   EXPECT_EQ(RunCommand({"thumbs", "clean", In("nothere")}).status, 1);
 }
 

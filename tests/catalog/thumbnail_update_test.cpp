@@ -48,9 +48,12 @@ class ThumbnailUpdate : public testing::Test {
  protected:
   ThumbnailUpdate() {
     kind = DriveKind::Fixed;
-    platform::ReplaceVolumeFunction([](const std::string&) { return platform::Volume{true, "v", 1, kind}; });
+    platform::ReplaceVolumeFunction([](const std::string&) {
+      return platform::Volume{true, "v", 1, kind};
+    });
     platform::FixNow(kNow);
-    for (const char* name : {"a.bmp", "b.bmp", ".c.bmp"}) WriteBytes(folder_.Path(name), BitmapFile(3, 3, 24));
+    for (const char* name : {"a.bmp", "b.bmp", ".c.bmp"})
+      WriteBytes(folder_.Path(name), BitmapFile(3, 3, 24));
     for (const char* name : {"a.THN", "gone.THN", "B.thn.txt"}) WriteText(folder_.Path(name), "");
     browser_.options.compacts = true;
     browser_.folder = folder_.Path();

@@ -34,7 +34,8 @@ class Convert : public testing::Test {
   }
   std::vector<std::string> Names(const std::string& folder) const {
     std::vector<std::string> names;
-    for (const auto& entry : fs::directory_iterator(In(folder))) names.push_back(entry.path().filename());
+    for (const auto& entry : fs::directory_iterator(In(folder)))
+      names.push_back(entry.path().filename());
     std::sort(names.begin(), names.end());
     return names;
   }
@@ -95,8 +96,9 @@ TEST_F(Convert, FailuresLeaveNothingBehindAndStopNobody) {
   fs::create_directory(In("out"));
   fs::create_directory(In("out/a.pcx"));
   mkfifo(In("out/mono.pcx").c_str(), 0600);
-  const CommandResult result = Run({In("broken.bmp"), In("gone.bmp"), In("a.bmp"), In("mono.bmp"), In("tree"), "-t", "pcx", "-d",
-                                    In("out"), "--overwrite", "replace", "--json"});
+  const CommandResult result =
+      Run({In("broken.bmp"), In("gone.bmp"), In("a.bmp"), In("mono.bmp"), In("tree"), "-t", "pcx",
+           "-d", In("out"), "--overwrite", "replace", "--json"});
   EXPECT_EQ(result.status, 1);
   std::vector<int> statuses;
   for (const json& element : json::parse(result.out)) {
@@ -151,7 +153,8 @@ TEST_F(Convert, AnswersForAllThatFollow) {
   fs::create_directory(In("out"));
   WriteText(In("out/a.pcx"), "old");
   WriteText(In("out/mono.pcx"), "old");
-  const CommandResult result = Run({In("a.bmp"), In("mono.bmp"), "-t", "pcx", "-d", In("out")}, {"R\n", true});
+  const CommandResult result =
+      Run({In("a.bmp"), In("mono.bmp"), "-t", "pcx", "-d", In("out")}, {"R\n", true});
   EXPECT_EQ(result.status, 0);
   EXPECT_NE(ReadText(In("out/a.pcx")), "old");
   EXPECT_NE(ReadText(In("out/mono.pcx")), "old");
@@ -162,11 +165,13 @@ TEST_F(Convert, SourcesOfOneNameNeverReplaceEachOther) {
   for (const char* policy : {"keep-both", "replace"}) {
     SCOPED_TRACE(policy);
     fs::remove_all(In("out"));
-    const CommandResult result = Run({In("a.bmp"), In("tree/a.pcx"), "-t", "pcx", "-d", In("out"), "--overwrite", policy});
+    const CommandResult result =
+        Run({In("a.bmp"), In("tree/a.pcx"), "-t", "pcx", "-d", In("out"), "--overwrite", policy});
     EXPECT_EQ(result.status, 0) << result.err;
     EXPECT_THAT(Names("out"), ElementsAre("a [1].pcx", "a.pcx"));
   }
-  // To replace is allowed for the names that were asked for, not for the numbered ones that only the run came to need.
+  // To replace is allowed for the names that were asked for, not for the numbered ones that only
+  // the run came to need.
   Run({In("a.bmp"), In("tree/a.pcx"), "-t", "pcx", "-d", In("out"), "--overwrite", "replace"});
   EXPECT_THAT(Names("out"), ElementsAre("a [1].pcx", "a [2].pcx", "a.pcx"));
   // A source that is still to be read is not replaced by the output of another.
@@ -189,7 +194,8 @@ TEST_F(Convert, NumberedVariantsStayInTheirRange) {
   WriteText(In("a.pcx"), "old");
   WriteText(In("a [7].pcx"), "old");
   const auto run = [&](const std::string& least) {
-    return Run({In("a.bmp"), "-t", "pcx", "--set", "NumberedVariantMin=" + least, "--set=NumberedVariantMax=8"});
+    return Run({In("a.bmp"), "-t", "pcx", "--set", "NumberedVariantMin=" + least,
+                "--set=NumberedVariantMax=8"});
   };
   EXPECT_EQ(run("7").out, In("a.bmp") + " -> " + In("a [8].pcx") + "\n");
   const CommandResult full = run("7");
@@ -218,7 +224,8 @@ TEST_F(Convert, DepthIsReducedOnlyWhenAskedFor) {
 
 TEST_F(Convert, DryRunSaysTheSameAndDoesNothing) {
   WriteText(In("broken.bmp"), "no bitmap");
-  const std::vector<std::string> arguments{folder_.Path(), In("tree"), "-t", "pcx", "-d", In("out")};
+  const std::vector<std::string> arguments{folder_.Path(), In("tree"), "-t",
+                                           "pcx",          "-d",       In("out")};
   std::vector<std::string> dry = arguments;
   dry.push_back("--dry-run");
   const CommandResult told = Run(dry);

@@ -78,8 +78,8 @@ TEST_F(ExifCommand, EscapesWhatValuesMayHold) {
 TEST_F(ExifCommand, PrintsJson) {
   WriteText(folder.Path("without.bmp"), "BM");
   WriteBytes(folder.Path("refused.tif"), Hex("4949 2B00 08000000"));
-  const CommandResult result =
-      Exif({"--json", picture, folder.Path("without.bmp"), folder.Path("refused.tif"), folder.Path("missing.jpg")});
+  const CommandResult result = Exif({"--json", picture, folder.Path("without.bmp"),
+                                     folder.Path("refused.tif"), folder.Path("missing.jpg")});
   EXPECT_EQ(result.status, 1);
   const auto json = nlohmann::json::parse(result.out);
   ASSERT_EQ(json.size(), 4u);
@@ -88,8 +88,9 @@ TEST_F(ExifCommand, PrintsJson) {
   EXPECT_EQ(json[0]["message"], "Ok");
   ASSERT_EQ(json[0]["directories"].size(), 4u);
   EXPECT_EQ(json[0]["directories"][2]["label"], "EXIF");
-  EXPECT_EQ(json[0]["directories"][0]["entries"][1],
-            nlohmann::json::parse(R"({"tag": 274, "name": "Orientation of image", "type": 3, "count": 1,
+  EXPECT_EQ(
+      json[0]["directories"][0]["entries"][1],
+      nlohmann::json::parse(R"({"tag": 274, "name": "Orientation of image", "type": 3, "count": 1,
                                       "text": "Bottom Left"})"));
   EXPECT_EQ(json[1]["status"], 0);
   EXPECT_EQ(json[1]["directories"], nlohmann::json::array());
@@ -132,10 +133,12 @@ TEST_F(ExifCommand, MeasuresDistances) {
   EXPECT_EQ(Exif({"--distance", "-.5,0", "+.5,0"}).out, "69.045 miles\n");
   EXPECT_EQ(Exif({picture, "--distance", "45,9", "46,9"}).out, std::string(kBlockText) + "69.045 miles\n");
   EXPECT_EQ(Exif({"--distance", "-45,9", "-46,9", picture}).out, std::string(kBlockText) + "69.045 miles\n");
-  const auto json = nlohmann::json::parse(Exif({"--json", "--set", kilometers, "--distance", "45,9", "46,9"}).out);
+  const auto json = nlohmann::json::parse(
+      Exif({"--json", "--set", kilometers, "--distance", "45,9", "46,9"}).out);
   EXPECT_NEAR(json[0]["distance"], 111.125, 0.001);
   EXPECT_EQ(json[0]["unit"], "kilometers");
-  for (const char* bad : {"", "45", "45,", ",9", "45,9,1", "45 9", "91,0", "nan,0", "1e400,0", "0,361", "45,9x"}) {
+  for (const char* bad :
+       {"", "45", "45,", ",9", "45,9,1", "45 9", "91,0", "nan,0", "1e400,0", "0,361", "45,9x"}) {
     SCOPED_TRACE(bad);
     const CommandResult result = Exif({"--distance", bad, "46,9"});
     EXPECT_EQ(result.status, 2);

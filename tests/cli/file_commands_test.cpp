@@ -38,7 +38,8 @@ class FileCommands : public testing::Test {
   std::vector<std::string> Files(const CommandResult& result) const {
     std::vector<std::string> files;
     for (const json& element : json::parse(result.out)) {
-      files.push_back(fs::path(element["file"].get<std::string>()).lexically_relative(folder_.Path()));
+      files.push_back(
+          fs::path(element["file"].get<std::string>()).lexically_relative(folder_.Path()));
     }
     return files;
   }
@@ -81,7 +82,8 @@ TEST_F(FileCommands, SelectionKeepsItsOrder) {
     EXPECT_EQ(result.status, 0) << result.err;
     EXPECT_EQ(Files(result), row.files);
   }
-  const CommandResult fromInput = RunCommand({"info", "--json", "--files-from", "-"}, {.input = In("sub/c.bmp") + "\n"});
+  const CommandResult fromInput =
+      RunCommand({"info", "--json", "--files-from", "-"}, {.input = In("sub/c.bmp") + "\n"});
   EXPECT_THAT(Files(fromInput), ElementsAre("sub/c.bmp"));
   EXPECT_EQ(RunCommand({"info", "--files-from", In("missing")}).status, 2);
 }
@@ -176,8 +178,9 @@ TEST_F(FileCommands, InfoAsJson) {
   const CommandResult result = RunCommand({"info", "--json", In("a.bmp"), In("missing.bmp")});
   const json array = json::parse(result.out);
   const json& facts = array[0];
-  const char* const keys[] = {"file",  "status", "message",      "format", "index",    "description", "typeName",
-                              "width", "height", "bitsPerPixel", "alpha",  "fileSize", "imageBytes",  "details"};
+  const char* const keys[] = {"file",        "status",   "message",    "format", "index",
+                              "description", "typeName", "width",      "height", "bitsPerPixel",
+                              "alpha",       "fileSize", "imageBytes", "details"};
   for (const char* key : keys) EXPECT_TRUE(facts.contains(key)) << key;
   EXPECT_EQ(facts["format"], "BMP");
   EXPECT_EQ(facts["width"], 5);
@@ -204,7 +207,8 @@ TEST_F(FileCommands, HostileNames) {
   // Pipes get the name as it is, terminals never a control character.
   EXPECT_THAT(RunCommand({"verify", escape}).out, HasSubstr("e\x1b[31m\n.bmp: Ok"));
   EXPECT_THAT(RunCommand({"verify", escape}, {.output = true}).out, HasSubstr("e\\x1B[31m\\n.bmp: Ok"));
-  const CommandResult failing = RunCommand({"--color=never", "verify", In("\x1b]0;owned\x07.bmp")}, {.interactive = true});
+  const CommandResult failing =
+      RunCommand({"--color=never", "verify", In("\x1b]0;owned\x07.bmp")}, {.interactive = true});
   EXPECT_EQ(failing.err.find('\x1b'), std::string::npos);
 }
 
@@ -247,7 +251,8 @@ TEST(FormatsCommand, ListsTheRegistry) {
 
 TEST(DoctorCommand, TellsWhatIsWrongWithTheConfiguration) {
   const TemporaryFolder folder;
-  WriteText(folder.Path("Fotomill Professional 11.ini"), "[Fotomill]\nJpegCompression=high\nPngCompression=6\n");
+  WriteText(folder.Path("Fotomill Professional 11.ini"),
+            "[Fotomill]\nJpegCompression=high\nPngCompression=6\n");
   const CommandResult result = RunCommand({"--data", folder.Path(), "doctor"});
   EXPECT_EQ(result.status, 0);
   EXPECT_THAT(result.out, HasSubstr("Data folder     " + folder.Path() + "\n"));

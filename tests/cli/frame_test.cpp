@@ -64,8 +64,9 @@ TEST(Frame, ExitStatusesAndMessages) {
 
 // Whatever a name looks like, it comes through byte for byte.
 TEST(Frame, NamesComeThroughUnchanged) {
-  for (const std::string name : {"[a,b].bmp", "[x]", "{}", "%%", "", " ", "a\nb.bmp", "\xff\xfe.bmp", "--", "-x.bmp", "--json",
-                                 "a=b", "++", "/?", "match", "-5", "\"quoted\""}) {
+  for (const std::string name :
+       {"[a,b].bmp", "[x]", "{}", "%%", "", " ", "a\nb.bmp", "\xff\xfe.bmp", "--", "-x.bmp",
+        "--json", "a=b", "++", "/?", "match", "-5", "\"quoted\""}) {
     SCOPED_TRACE(name);
     const CommandResult result = RunCommand({"match", "--", name, "end.bmp"});
     EXPECT_THAT(result.out, testing::StartsWith(name + ": "));

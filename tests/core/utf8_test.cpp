@@ -26,7 +26,8 @@ TEST(Utf8, CharactersAreReadOneByOne) {
   for (const Row& row : rows) {
     SCOPED_TRACE(testing::PrintToString(row.text));
     std::u32string characters;
-    for (std::string_view rest = row.text; !rest.empty();) characters += NextCharacter(rest, kUnknown);
+    for (std::string_view rest = row.text; !rest.empty();)
+      characters += NextCharacter(rest, kUnknown);
     EXPECT_EQ(characters, row.characters);
     EXPECT_EQ(IsUtf8(row.text), row.characters.find(kUnknown) == std::u32string_view::npos);
   }
@@ -38,7 +39,8 @@ TEST(Utf8, CharactersAreReadOneByOne) {
 TEST(Utf8, TextsAreCutBetweenCharacters) {
   constexpr std::string_view kText = "a\xC3\xB6\xE2\x82\xAC\xF0\x9F\x98\x80.";
   const size_t lengths[] = {0, 1, 1, 3, 3, 3, 6, 6, 6, 6, 10, 11, 11};
-  for (size_t limit = 0; limit < std::size(lengths); ++limit) EXPECT_EQ(CutText(kText, limit).size(), lengths[limit]) << limit;
+  for (size_t limit = 0; limit < std::size(lengths); ++limit)
+    EXPECT_EQ(CutText(kText, limit).size(), lengths[limit]) << limit;
   EXPECT_EQ(CutText("\x80\x80\x80\x80\x80", 4).size(), 4u);  // no character is cut
 }
 

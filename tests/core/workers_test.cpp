@@ -184,11 +184,14 @@ TEST(OrderedRun, TellsWhatRanOutOfMemoryAndGoesOn) {
     WorkerPool pool(2);
     std::vector<Status> delivered;
     {
-      OrderedRun run({.work = [](size_t item) -> Status { return item == 3 ? throw std::bad_alloc() : Status::Ok; },
-                      .deliver = [&](size_t item, Status status) {
-                        EXPECT_EQ(item, delivered.size());
-                        delivered.push_back(status);
+      OrderedRun run({.work = [](size_t item) -> Status {
+                        return item == 3 ? throw std::bad_alloc() : Status::Ok;
                       },
+                      .deliver =
+                          [&](size_t item, Status status) {
+                            EXPECT_EQ(item, delivered.size());
+                            delivered.push_back(status);
+                          },
                       .goesOn = [] { return true; },
                       .tick = {},
                       .ahead = 5},
@@ -212,7 +215,8 @@ TEST(OrderedRun, AQuestionHoldsNoCore) {
                               turns.push_back(item);
                               if (item > 0) return;
                               Gate done;
-                              for (int i = 0; i < 2; ++i) ASSERT_TRUE(pool.Run(Lane::Compute, [&] { done.Pass(); }));
+                              for (int i = 0; i < 2; ++i)
+                                ASSERT_TRUE(pool.Run(Lane::Compute, [&] { done.Pass(); }));
                               othersDone = done.Await(2);
                               done.Open();
                               while (done.Waiting() > 0) std::this_thread::yield();
@@ -295,7 +299,8 @@ std::atomic<int> asked{0};
 platform::Volume FarVolume(const std::string& path) {
   ++asked;
   platform::Volume volume;
-  volume.kind = path.starts_with("/near") ? platform::DriveKind::Fixed : platform::DriveKind::Network;
+  volume.kind =
+      path.starts_with("/near") ? platform::DriveKind::Fixed : platform::DriveKind::Network;
   return volume;
 }
 

@@ -13,13 +13,14 @@
 namespace fotomill::desktop {
 namespace {
 
-// A GIF of 1 by 1 whose frames have these delays in hundredths of a second, black and white in turn. `repeats` below 0: it does
-// not loop.
+// A GIF of 1 by 1 whose frames have these delays in hundredths of a second, black and white in
+// turn. `repeats` below 0: it does not loop.
 std::vector<uint8_t> Gif(const std::vector<int>& delays, int repeats) {
   std::string text = "474946383961 0100 0100 80 00 00 000000 FFFFFF ";
   const auto word = [](int value) {
     char hex[16];
-    std::snprintf(hex, sizeof hex, "%02X%02X ", static_cast<unsigned>(value & 255), static_cast<unsigned>(value >> 8 & 255));
+    std::snprintf(hex, sizeof hex, "%02X%02X ", static_cast<unsigned>(value & 255),
+                  static_cast<unsigned>(value >> 8 & 255));
     return std::string(hex);
   };
   if (repeats >= 0) text += "21 FF 0B 4E45545343415045322E30 03 01 " + word(repeats) + "00 ";
@@ -34,11 +35,13 @@ class Player {
  public:
   Player(const std::vector<uint8_t>& file, uint64_t capacity) {
     test::WriteBytes(folder_.Path("a.gif"), file);
-    player_ = std::make_unique<AnimationPlayer>(ViewRequest{folder_.Path("a.gif"), 0, 0, 0}, capacity, [] {});
+    player_ = std::make_unique<AnimationPlayer>(ViewRequest{folder_.Path("a.gif"), 0, 0, 0},
+                                                capacity, [] {});
   }
   AnimationPlayer* operator->() { return player_.get(); }
 
-  // Lets the decoder do all it can do, then asks for the frame: its number and the blue of its pixel, as "2:FF".
+  // Lets the decoder do all it can do, then asks for the frame: its number and the blue of its
+  // pixel, as "2:FF".
   std::string At(double now) {
     ViewPicturePointer picture;
     for (int wait = 0; wait < 2000 && (player_->Failure() == Status::Ok || player_->Count() > 0) &&
@@ -48,7 +51,8 @@ class Player {
       std::this_thread::sleep_for(std::chrono::milliseconds(1));
     }
     if (picture == nullptr) return "none";
-    return std::to_string(player_->Frame()) + (picture->picture->image.Row(0)[0] == 0 ? ":black" : ":white");
+    return std::to_string(player_->Frame()) +
+           (picture->picture->image.Row(0)[0] == 0 ? ":black" : ":white");
   }
 
  private:
@@ -94,15 +98,17 @@ TEST(AnimationPlayer, ShowsEachFrameForItsTime) {
        true},
       {"one frame", Gif({10}, 0), {{0, "0:black"}, {0.2, "0:black"}}, false},
   };
-  for (const uint64_t capacity : {uint64_t{1} << 28, uint64_t{0}}) {  // all frames in memory, or two of them
+  // all frames in memory, or two of them
+  for (const uint64_t capacity : {uint64_t{1} << 28, uint64_t{0}}) {
     for (const Row& row : rows) {
       SCOPED_TRACE(row.name);
       Player player(row.file, capacity);
       player->Play();
-      for (const Moment& moment : row.moments) EXPECT_EQ(player.At(moment.seconds), moment.frame) << moment.seconds;
+      for (const Moment& moment : row.moments)
+        EXPECT_EQ(player.At(moment.seconds), moment.frame) << moment.seconds;
       EXPECT_EQ(player->Playing(), row.plays);
-      EXPECT_EQ(player->PlayedOnce(),
-                row.moments.back().seconds > 0.11 && std::string(row.name).find("late") == std::string::npos);
+      EXPECT_EQ(player->PlayedOnce(), row.moments.back().seconds > 0.11 &&
+                                          std::string(row.name).find("late") == std::string::npos);
     }
   }
 }
@@ -137,7 +143,8 @@ TEST(AnimationPlayer, EndsWhereTheFileIsBroken) {
   file.resize(file.size() - 4);  // within the pixels of the last frame
   Player player(file, 1 << 20);
   player->Play();
-  for (const Moment& moment : {Moment{0, "0:black"}, {0.1, "1:white"}, {0.2, "0:black"}, {0.31, "1:white"}}) {
+  for (const Moment& moment :
+       {Moment{0, "0:black"}, {0.1, "1:white"}, {0.2, "0:black"}, {0.31, "1:white"}}) {
     EXPECT_EQ(player.At(moment.seconds), moment.frame);
   }
   EXPECT_EQ(player->Count(), 2u);
@@ -152,7 +159,8 @@ TEST(AnimationPlayer, EndsWhereTheFileIsBroken) {
   EXPECT_EQ(tooLarge->Failure(), Status::MemoryAllocationError);
 }
 
-std::vector<size_t> Order(const SlideshowChoices& choices, size_t count, size_t place, size_t steps) {
+std::vector<size_t> Order(const SlideshowChoices& choices, size_t count, size_t place,
+                          size_t steps) {
   Slideshow show(choices, count, place, 1);
   std::vector<size_t> order{place};
   for (; steps > 0; --steps) {

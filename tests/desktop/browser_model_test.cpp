@@ -15,13 +15,15 @@ namespace fotomill::desktop {
 namespace {
 
 TEST(NaturalOrder, NumbersCountAsNumbers) {
-  const char* const inOrder[] = {"", "1", "2.png", "10.png", "010.pngx", "a1b2", "a1b10", "B", "b2", "c"};
+  const char* const inOrder[] = {"",     "1",     "2.png", "10.png", "010.pngx",
+                                 "a1b2", "a1b10", "B",     "b2",     "c"};
   for (size_t i = 0; i + 1 < std::size(inOrder); ++i) {
     SCOPED_TRACE(inOrder[i]);
     EXPECT_LT(CompareNatural(inOrder[i], inOrder[i + 1]), 0);
     EXPECT_GT(CompareNatural(inOrder[i + 1], inOrder[i]), 0);
   }
-  // Numbers longer than any integer, and names that differ in case or zeros only, still have one order.
+  // Numbers longer than any integer, and names that differ in case or zeros only, still have one
+  // order.
   EXPECT_LT(CompareNatural("99999999999999999999999", "100000000000000000000000"), 0);
   EXPECT_NE(CompareNatural("A", "a"), 0);
   EXPECT_NE(CompareNatural("a01", "a1"), 0);
@@ -38,7 +40,8 @@ TEST(Filter, PartsAndWildcards) {
       {"aab", "*a*b", true},        {"aaab", "*ab", true},          {"x", "**", true},
       {"x", "xy", false},
   };
-  for (const auto& row : rows) EXPECT_EQ(MatchesFilter(row.name, row.pattern), row.matches) << row.name << " " << row.pattern;
+  for (const auto& row : rows)
+    EXPECT_EQ(MatchesFilter(row.name, row.pattern), row.matches) << row.name << " " << row.pattern;
 }
 
 std::vector<FolderItem> Items(std::initializer_list<const char*> names) {
@@ -58,7 +61,8 @@ std::string Shown(const BrowserModel& model) {
   std::string text;
   for (size_t line = 0; line < model.LineCount(); ++line) {
     const std::string name = model.Line(line).name + (model.Selected().IsSelected(line) ? "*" : "");
-    text += (text.empty() ? "" : " ") + (model.Selected().Focus() == line ? "[" + name + "]" : name);
+    text +=
+        (text.empty() ? "" : " ") + (model.Selected().Focus() == line ? "[" + name + "]" : name);
   }
   return text;
 }
@@ -120,11 +124,13 @@ TEST(PathBar, CrumbsAndTrail) {
     int room;
     size_t first;
   } const rows[] = {{120, 0}, {119, 1}, {110, 1}, {109, 2}, {0, 2}};
-  for (const auto& row : rows) EXPECT_EQ(FirstCrumbShown(widths, row.room, 20), row.first) << row.room;
+  for (const auto& row : rows)
+    EXPECT_EQ(FirstCrumbShown(widths, row.room, 20), row.first) << row.room;
 
   const std::vector<std::string> names = {"Sub", "sub1", "sub2", "other", "s\xFF"};
   EXPECT_EQ(Completions("/a/s", names), (std::vector<std::string>{"/a/sub1", "/a/sub2", "/a/Sub"}));
-  for (const char* complete : {"/a/", "/a/other", "/a/x", ""}) EXPECT_TRUE(Completions(complete, names).empty()) << complete;
+  for (const char* complete : {"/a/", "/a/other", "/a/x", ""})
+    EXPECT_TRUE(Completions(complete, names).empty()) << complete;
 
   FolderTrail trail;
   for (const char* folder : {"/a", "/b", "/c"}) trail.Go(folder);
@@ -142,7 +148,8 @@ TEST(PathBar, CrumbsAndTrail) {
 TEST(DetailColumns, AreArrangedByAText) {
   const DetailColumns all = ParseDetailColumns("");
   ASSERT_EQ(all.size(), AllDetails().size());
-  const DetailColumns arranged = ParseDetailColumns("Size:99,-Name:300,nonsense,-Type:9999999,Size:1,Depth:x,Gone:3");
+  const DetailColumns arranged =
+      ParseDetailColumns("Size:99,-Name:300,nonsense,-Type:9999999,Size:1,Depth:x,Gone:3");
   ASSERT_EQ(arranged.size(), all.size());
   EXPECT_EQ(arranged[0], (DetailColumn{2, 99, true}));
   EXPECT_EQ(arranged[1], (DetailColumn{0, 300, true}));  // the names cannot be hidden
@@ -173,7 +180,8 @@ TEST(BrowserModel, TypingFinds) {
 
 TEST(Toolbar, KeepsOrderAndSetAndTakesNewButtonsIn) {
   const std::vector<std::string> known{"view", "convert", "info", "setup"};
-  const std::vector<ToolbarButton> expected{{"setup", true}, {"view", false}, {"convert", true}, {"info", true}};
+  const std::vector<ToolbarButton> expected{
+      {"setup", true}, {"view", false}, {"convert", true}, {"info", true}};
   EXPECT_EQ(ParseToolbar("setup\r\n-view\ngone\nsetup\n-\nconvert\n", known), expected);
 }
 

@@ -28,10 +28,13 @@ using testing::IsEmpty;
 class DesktopFilesTest : public testing::Test {
  protected:
   DesktopFilesTest() : data_("XDG_DATA_HOME", folder_.Path("data")) {
-    for (const char* name : {"from", "to", "from/sub"}) std::filesystem::create_directory(folder_.Path(name));
+    for (const char* name : {"from", "to", "from/sub"})
+      std::filesystem::create_directory(folder_.Path(name));
     for (const char* name : {"a.png", "b.png", "sub/c.png"}) WriteText(From(name), name);
   }
-  std::string From(std::string_view name) const { return folder_.Path("from/" + std::string(name)); }
+  std::string From(std::string_view name) const {
+    return folder_.Path("from/" + std::string(name));
+  }
   std::string To(std::string_view name) const { return folder_.Path("to/" + std::string(name)); }
   test::TemporaryFolder folder_;
   test::ScopedEnvironment data_;
@@ -65,7 +68,8 @@ TEST_F(DesktopFilesTest, TurnsGiveTheFileBackAndTheirThumbnailsGo) {
   test::WriteBytes(path, test::BitmapFile(9, 5, 24));
   EXPECT_EQ(TurnOneFile(From("link.bmp"), Orientation::HalfTurn).failures.size(), 1u);
   EXPECT_TRUE(std::filesystem::is_symlink(From("link.bmp")));
-  // What comes after a batch has replaced a file, and before it ends, is somebody else's work as well.
+  // What comes after a batch has replaced a file, and before it ends, is somebody else's work as
+  // well.
   PreviousFiles batch;
   ASSERT_TRUE(batch.Keep(path) && batch.Keep(From("b.png")));
   WriteText(path, "turned");
@@ -112,7 +116,8 @@ TEST(TabSets, AreFilesOfTheDataFolder) {
   const test::TemporaryFolder folder;
   const std::string before = DataFolder();
   SetDataFolder(folder.Path());
-  for (const char* file : {"b10.fmwtabset", "b2.fmwtabset", "other.txt"}) WriteText(folder.Path(file), "");
+  for (const char* file : {"b10.fmwtabset", "b2.fmwtabset", "other.txt"})
+    WriteText(folder.Path(file), "");
   EXPECT_THAT(TabSetNames(), ElementsAre("b2", "b10"));
   for (const char* name : {"", "a/b", ".hidden", "a\nb"}) EXPECT_EQ(TabSetFile(name), "") << name;
   EXPECT_TRUE(DeleteTabSet("b10"));
@@ -136,7 +141,9 @@ TEST(FolderViews, AreKeptPerFolderTheLatestFirst) {
 }
 
 TEST(Session, ComesBackAndForgivesOddLines) {
-  Session session{900, 600, true, "Size:9", 1, {{"/a=b [Tab]", {{1, 4, 3}, true}, 1234, "x.png"}, {"/c", {}, 0, ""}}};
+  Session session{900,  600,
+                  true, "Size:9",
+                  1,    {{"/a=b [Tab]", {{1, 4, 3}, true}, 1234, "x.png"}, {"/c", {}, 0, ""}}};
   EXPECT_EQ(ParseSession(SessionText(session)), session);
   session.tabs[1].folder = "/new\nline";
   EXPECT_EQ(ParseSession(SessionText(session)).tabs.size(), 1u);

@@ -66,7 +66,8 @@ class Reports : public testing::Test {
     SetDataFolder({});
   }
   std::string Sample(const std::string& name) {
-    test::WriteBytes(folder_.Path(name), test::ReadBytes(test::SourcePath("samples/bmp-true-color.bmp")));
+    test::WriteBytes(folder_.Path(name),
+                     test::ReadBytes(test::SourcePath("samples/bmp-true-color.bmp")));
     return folder_.Path(name);
   }
 
@@ -81,7 +82,8 @@ TEST_F(Reports, ExifRowsAreTheLinesOfTheText) {
     const ExifReport report = ReadExifReport(path, {.showTypes = types == 1});
     EXPECT_EQ(report.status, Status::Ok);
     std::string text;
-    for (const ExifRow& row : report.rows) text += row.heading ? row.name + "\n" : "    " + row.name + "\t" + row.text + "\n";
+    for (const ExifRow& row : report.rows)
+      text += row.heading ? row.name + "\n" : "    " + row.name + "\t" + row.text + "\n";
     EXPECT_EQ(text, report.text);
     EXPECT_THAT(text, HasSubstr("DIRECTORY EXIF\n"));
     EXPECT_EQ(text.find(" [SHORT]\t") != std::string::npos, types == 1);
@@ -92,7 +94,8 @@ TEST_F(Reports, ExifRowsAreTheLinesOfTheText) {
   EXPECT_EQ(ReadExifReport(folder_.Path("none.jpg"), {}).status, Status::FileOpenError);
 }
 
-std::string ValueOf(const std::vector<InfoSection>& sections, const std::string& title, const std::string& label) {
+std::string ValueOf(const std::vector<InfoSection>& sections, const std::string& title,
+                    const std::string& label) {
   for (const InfoSection& section : sections) {
     for (const InfoLine& line : section.lines) {
       if (section.title == title && line.label == label) return line.value;
@@ -127,8 +130,8 @@ TEST_F(Reports, InfoOfOneAndOfSeveral) {
   EXPECT_EQ(ValueOf(summary, "The same in all", "Folder"), folder_.Path() + "/");
   EXPECT_EQ(ValueOf(summary, "Different", "File size"), "2 different: 50678 bytes (2 files); 19 bytes");
   EXPECT_EQ(ValueOf(summary, "Different", "Dimensions"), "150 x 112 pixels (in 2 of 3 files)");
-  EXPECT_THAT(TextOf(broken),
-              testing::StartsWith(folder_.Path("no.png") + "\n" + broken.problem + "\nGeneral\n    File name: no.png\n"));
+  EXPECT_THAT(TextOf(broken), testing::StartsWith(folder_.Path("no.png") + "\n" + broken.problem +
+                                                  "\nGeneral\n    File name: no.png\n"));
 }
 
 TEST(HistoryDates, EachStyle) {
@@ -148,7 +151,8 @@ TEST(HistoryDates, EachStyle) {
         "1970-01-01 12:00"}},
   };
   for (const auto& row : rows) {
-    for (int32_t mode = 0; mode < 4; ++mode) EXPECT_EQ(HistoryDate(row.seconds, mode), row.styles[mode]);
+    for (int32_t mode = 0; mode < 4; ++mode)
+      EXPECT_EQ(HistoryDate(row.seconds, mode), row.styles[mode]);
   }
 }
 
@@ -162,7 +166,8 @@ TEST_F(Reports, HistorySortsRemovesAndForgets) {
   EXPECT_TRUE(list.Read());
   const auto names = [&] {
     std::vector<std::string> shown;
-    for (size_t row = 0; row < list.Count(); ++row) shown.push_back(list.Cell(row, choice::kColumnName));
+    for (size_t row = 0; row < list.Count(); ++row)
+      shown.push_back(list.Cell(row, choice::kColumnName));
     return shown;
   };
   EXPECT_THAT(names(), ElementsAre("a2.bmp", "a10.bmp", "B.bmp"));
@@ -179,8 +184,9 @@ TEST_F(Reports, HistorySortsRemovesAndForgets) {
   ASSERT_EQ(UpdateFileHistory(HistoryOptionsFromSettings(), {&later, 1}), HistoryUpdate::Done);
   EXPECT_TRUE(list.Remove({0, 2}));
   EXPECT_THAT(names(), ElementsAre("B.bmp"));
-  EXPECT_THAT(test::ReadText(FileHistoryPath(HistoryOptionsFromSettings())),
-              testing::AllOf(HasSubstr("B.bmp"), HasSubstr("c.bmp"), testing::Not(HasSubstr("a2"))));
+  EXPECT_THAT(
+      test::ReadText(FileHistoryPath(HistoryOptionsFromSettings())),
+      testing::AllOf(HasSubstr("B.bmp"), HasSubstr("c.bmp"), testing::Not(HasSubstr("a2"))));
   EXPECT_TRUE(list.Clear());
   EXPECT_FALSE(platform::FileExists(FileHistoryPath(HistoryOptionsFromSettings())));
   test::WriteText(FileHistoryPath(HistoryOptionsFromSettings()), "no history at all");
@@ -215,7 +221,8 @@ TEST_F(Reports, CompactionTellsWhatItDid) {
 TEST_F(Reports, OrphansBelowAreFoundWhenAskedFor) {
   Sample("a.bmp");
   ASSERT_TRUE(platform::MakeFolders(folder_.Path("sub")));
-  for (const char* name : {"A.THN", "gone.thn", ".hidden.THN", "sub/gone.THN"}) test::WriteText(folder_.Path(name), "");
+  for (const char* name : {"A.THN", "gone.thn", ".hidden.THN", "sub/gone.THN"})
+    test::WriteText(folder_.Path(name), "");
   const StopSource stop, stopped;
   stopped.Stop();
   EXPECT_THAT(FindOrphanThumbnails(folder_.Path(), false, stop.Token()), ElementsAre(folder_.Path("gone.thn")));
@@ -234,11 +241,13 @@ TEST_F(Reports, SettingsTravel) {
   settings.PrefixCrop = std::string_view("Cut ");
   ASSERT_TRUE(ExportConfiguration(folder_.Path("out.ini")).ok) << "what was not saved yet is saved first";
   EXPECT_THAT(test::ReadText(folder_.Path("out.ini")),
-              testing::AllOf(testing::StartsWith(";\r\n;\r\n;------ INI"), HasSubstr("JpegCompression=42\n")));
+              testing::AllOf(testing::StartsWith(";\r\n;\r\n;------ INI"),
+                             HasSubstr("JpegCompression=42\n")));
   settings.JpegCompression = 80;
   settings.UndoLevels = 3;
   test::WriteText(folder_.Path("in.ini"),
-                  test::ReadText(folder_.Path("out.ini")) + "PngCompression=many\nNoSuchKey=1\nVersionNumber=9\n");
+                  test::ReadText(folder_.Path("out.ini")) +
+                      "PngCompression=many\nNoSuchKey=1\nVersionNumber=9\n");
   const Transfer transfer = ImportConfiguration(folder_.Path("in.ini"));
   EXPECT_TRUE(transfer.ok);
   EXPECT_EQ(transfer.message,

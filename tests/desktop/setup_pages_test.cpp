@@ -21,14 +21,16 @@ std::set<std::string> UsedKeys() {
   std::set<std::string> used;
   for (const auto& entry : std::filesystem::recursive_directory_iterator(test::SourcePath("src"))) {
     const std::string name = entry.path().filename().string();
-    if (!entry.is_regular_file() || name == "setup_pages.cpp" || name == "override_options.cpp" || name == "spin_range.cpp")
+    if (!entry.is_regular_file() || name == "setup_pages.cpp" || name == "override_options.cpp" ||
+        name == "spin_range.cpp")
       continue;
     const std::string text = test::ReadText(entry.path().string());
     for (const std::string_view lead : {"settings.", "KeyNumber::", "&Settings::", ".key = \""}) {
       for (size_t at = text.find(lead); at != std::string::npos; at = text.find(lead, at + 1)) {
         const size_t start = at + lead.size();
         size_t end = start;
-        while (end < text.size() && (std::isalnum(static_cast<unsigned char>(text[end])) != 0)) ++end;
+        while (end < text.size() && (std::isalnum(static_cast<unsigned char>(text[end])) != 0))
+          ++end;
         used.insert(text.substr(start, end - start));
       }
     }

@@ -67,7 +67,8 @@ PackedImage Ramp(int32_t width, int32_t height) {
   PackedImage image;
   EXPECT_EQ(NewPackedImage(width, height, nullptr, 24, image), Status::Ok);
   for (int32_t y = 0; y < height; ++y) {
-    for (int32_t x = 0; x < 3 * width; ++x) image.Row(y)[static_cast<size_t>(x)] = static_cast<uint8_t>(40 * y + x);
+    for (int32_t x = 0; x < 3 * width; ++x)
+      image.Row(y)[static_cast<size_t>(x)] = static_cast<uint8_t>(40 * y + x);
   }
   return image;
 }
@@ -112,7 +113,8 @@ TEST(DrawView, SquaresShowThroughAndStayInPlace) {
   alpha.Row(0)[3] = 255;
   alpha.Row(1)[0] = 128;
   const ViewSource source{image, alpha};
-  const Backdrop squares{.around = 0x00ff00, .squares = true, .square = {0x006400, 0x00c800}, .side = 2};
+  const Backdrop squares{
+      .around = 0x00ff00, .squares = true, .square = {0x006400, 0x00c800}, .side = 2};
   RgbImage canvas = FilledImage(6, 4, 0);
   ViewTransform view;
   view.SetPicture(4, 2);
@@ -124,7 +126,8 @@ TEST(DrawView, SquaresShowThroughAndStayInPlace) {
   view.Pan(-1, 0);
   DrawView(source, view, squares, false, canvas);
   EXPECT_EQ(Greens(canvas, 0), (std::vector<int>{100, 100, 200, 200, 10, 10}));
-  // Between pixels, what is transparent gives no color away: from 10 to the square behind without a shade of 7.
+  // Between pixels, what is transparent gives no color away: from 10 to the square behind without a
+  // shade of 7.
   view.ZoomTo(4, 0, 0);
   view.Pan(-100, 0);
   DrawView(source, view, {.around = 0x000a00}, true, canvas);
@@ -171,10 +174,13 @@ TEST(PhotoFacts, TellWhatPhotographersAsk) {
   EXPECT_EQ(PhotoFacts(test::BigEndianBlock()), little);
   EXPECT_EQ(PhotoFacts(test::LittleEndianBlock()), little);
   test::BlockBuilder builder;
-  const auto text = [&](const char* words) { return builder.Bytes({words, words + std::strlen(words) + 1}); };
+  const auto text = [&](const char* words) {
+    return builder.Bytes({words, words + std::strlen(words) + 1});
+  };
   const uint32_t make = text("ACME CORPORATION"), model = text("ACME 5D  "), lens = text("24-70mm"),
                  date = text("2001:05:19 18:36:41");
-  const uint32_t exposure = builder.Bytes({5, 0, 0, 0, 2, 0, 0, 0}), aperture = builder.Bytes({28, 0, 0, 0, 10, 0, 0, 0}),
+  const uint32_t exposure = builder.Bytes({5, 0, 0, 0, 2, 0, 0, 0}),
+                 aperture = builder.Bytes({28, 0, 0, 0, 10, 0, 0, 0}),
                  length = builder.Bytes({50, 0, 0, 0, 0, 0, 0, 0});  // by nothing
   builder.Patch32(4, builder.Directory({{0x010f, 2, 17, make},
                                         {0x0110, 2, 10, model},
@@ -190,7 +196,8 @@ TEST(PhotoFacts, TellWhatPhotographersAsk) {
 
 TEST(Thumbnail, MatteIsCutOff) {
   RgbImage square = FilledImage(6, 6, 0x112233);
-  for (int32_t y = 2; y < 4; ++y) square.Row(y)[3] = 9;  // a picture of 4 by 2 whose right side has the matte's color
+  // a picture of 4 by 2 whose right side has the matte's color
+  for (int32_t y = 2; y < 4; ++y) square.Row(y)[3] = 9;
   const RgbImage cut = WithoutMatte(square, 0x112233);
   EXPECT_EQ(cut.width, 4);
   EXPECT_EQ(cut.height, 2);
@@ -223,13 +230,16 @@ TEST(Thumbnail, DatabaseModesKeepWhatTheyMade) {
   EXPECT_EQ(LoadThumbnail(request)->status, Status::FileOpenError);
 }
 
-// A stand-in is the file's own thumbnail, upright as the picture is; where there is none, nothing is decoded.
+// A stand-in is the file's own thumbnail, upright as the picture is; where there is none, nothing
+// is decoded.
 TEST(Thumbnail, StandInsComeFromTheExif) {
   const test::TemporaryFolder folder;
-  const std::string small = folder.Path("small.jpg"), large = folder.Path("large.jpg"), plain = folder.Path("plain.bmp");
+  const std::string small = folder.Path("small.jpg"), large = folder.Path("large.jpg"),
+                    plain = folder.Path("plain.bmp");
   ASSERT_EQ(WritePicture(*test::PatternPicture(16, 12, 24), small, {}), Status::Ok);
   const PicturePointer picture = test::PatternPicture(400, 300, 24);
-  picture->metadata.exif = test::Hex("49492A00 08000000 0100 1201 0300 01000000 06000000 00000000");  // to be turned right
+  // to be turned right
+  picture->metadata.exif = test::Hex("49492A00 08000000 0100 1201 0300 01000000 06000000 00000000");
   ASSERT_TRUE(ReplaceExifThumbnail(picture->metadata.exif, test::ReadBytes(small), 65527));
   ASSERT_EQ(WritePicture(*picture, large, {}), Status::Ok);
   std::filesystem::copy_file(test::SourcePath("samples/bmp-true-color.bmp"), plain);
@@ -298,14 +308,16 @@ TEST(ThumbnailLoader, AReadyThumbnailIsLoadedOnce) {
       1, [] {}, load, [] { idle = true; });
   std::vector<ThumbnailRequest> requests;
   for (const bool standIn : {true, false}) {
-    for (const char* path : {"ready", "embedded", "none"}) requests.push_back({path, 1, 2, 96, 0, standIn});
+    for (const char* path : {"ready", "embedded", "none"})
+      requests.push_back({path, 1, 2, 96, 0, standIn});
   }
   loader.Want(requests);
   while (!idle) std::this_thread::yield();
   EXPECT_EQ(calls, 5);
   std::string order;
   for (const auto& result : loader.FetchResults()) {
-    order += result.request.path + (result.request.standIn ? "?" : "") + (result.thumbnail == nullptr ? "- " : " ");
+    order += result.request.path + (result.request.standIn ? "?" : "") +
+             (result.thumbnail == nullptr ? "- " : " ");
   }
   EXPECT_EQ(order, "ready embedded? none?- embedded none ");
 }
@@ -334,7 +346,9 @@ TEST(ThumbnailCache, KeepsTheLastUsedWithinItsBytes) {
     return thumbnail;
   };
   ThumbnailCache cache(3 * picture()->Bytes());
-  const auto request = [](const char* path, int64_t modified) { return ThumbnailRequest{path, modified, 0, 96, 0}; };
+  const auto request = [](const char* path, int64_t modified) {
+    return ThumbnailRequest{path, modified, 0, 96, 0};
+  };
   for (const char* path : {"a", "b", "c"}) cache.Put(request(path, 1), picture());
   EXPECT_NE(cache.Find(request("a", 1)), nullptr);
   cache.Put(request("d", 1), picture());

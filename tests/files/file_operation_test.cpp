@@ -17,14 +17,18 @@ using testing::IsEmpty;
 class FileOperationTest : public testing::Test {
  protected:
   FileOperationTest() : data_("XDG_DATA_HOME", folder_.Path("data")) {
-    for (const char* name : {"from", "to", "from/sub"}) std::filesystem::create_directory(folder_.Path(name));
+    for (const char* name : {"from", "to", "from/sub"})
+      std::filesystem::create_directory(folder_.Path(name));
     for (const char* name : {"a.png", "b.png", "sub/c.png"}) WriteText(From(name), name);
   }
-  std::string From(std::string_view name) const { return folder_.Path("from/" + std::string(name)); }
+  std::string From(std::string_view name) const {
+    return folder_.Path("from/" + std::string(name));
+  }
   std::string To(std::string_view name) const { return folder_.Path("to/" + std::string(name)); }
   std::vector<std::string> Names(const char* folder) const {
     std::vector<std::string> names;
-    for (const auto& entry : std::filesystem::directory_iterator(folder_.Path(folder))) names.push_back(entry.path().filename());
+    for (const auto& entry : std::filesystem::directory_iterator(folder_.Path(folder)))
+      names.push_back(entry.path().filename());
     std::sort(names.begin(), names.end());
     return names;
   }
@@ -33,9 +37,11 @@ class FileOperationTest : public testing::Test {
 };
 
 TEST_F(FileOperationTest, EveryOperationCanBeUndoneAndRedone) {
-  for (const FileOperationKind kind : {FileOperationKind::Move, FileOperationKind::Copy, FileOperationKind::Trash}) {
+  for (const FileOperationKind kind :
+       {FileOperationKind::Move, FileOperationKind::Copy, FileOperationKind::Trash}) {
     SCOPED_TRACE(static_cast<int>(kind));
-    const FileOperationResult done = CarryOut(PlanFileOperation(kind, {From("a.png"), From("sub")}, folder_.Path("to")));
+    const FileOperationResult done =
+        CarryOut(PlanFileOperation(kind, {From("a.png"), From("sub")}, folder_.Path("to")));
     ASSERT_THAT(done.failures, IsEmpty());
     EXPECT_EQ(Names("from").size(), kind == FileOperationKind::Copy ? 3u : 1u);
     EXPECT_EQ(Names("to").size(), kind == FileOperationKind::Trash ? 0u : 2u);
@@ -52,7 +58,8 @@ TEST_F(FileOperationTest, EveryOperationCanBeUndoneAndRedone) {
 
 TEST_F(FileOperationTest, NothingIsEverReplaced) {
   WriteText(To("a.png"), "there");
-  const FileOperation plan = PlanFileOperation(FileOperationKind::Copy, {From("a.png")}, folder_.Path("to"));
+  const FileOperation plan =
+      PlanFileOperation(FileOperationKind::Copy, {From("a.png")}, folder_.Path("to"));
   EXPECT_EQ(plan.steps[0].to, To("a [1].png"));
   WriteText(To("a [1].png"), "came meanwhile");
   for (const FileOperationKind kind : {FileOperationKind::Move, FileOperationKind::Copy}) {
@@ -62,12 +69,14 @@ TEST_F(FileOperationTest, NothingIsEverReplaced) {
   }
   EXPECT_EQ(ReadText(To("a.png")) + ReadText(To("a [1].png")) + ReadText(From("a.png")), "therecame meanwhilea.png");
   // Undoing a move whose old name was given away leaves both files.
-  const FileOperationResult moved = CarryOut(PlanFileOperation(FileOperationKind::Move, {From("b.png")}, folder_.Path("to")));
+  const FileOperationResult moved =
+      CarryOut(PlanFileOperation(FileOperationKind::Move, {From("b.png")}, folder_.Path("to")));
   WriteText(From("b.png"), "new");
   EXPECT_EQ(Revert(moved.done).failures.size(), 1u);
   EXPECT_EQ(ReadText(From("b.png")) + ReadText(To("b.png")), "newb.png");
   // A copy that was worked on stays as well.
-  const FileOperationResult copied = CarryOut(PlanFileOperation(FileOperationKind::Copy, {From("sub/c.png")}, folder_.Path("to")));
+  const FileOperationResult copied =
+      CarryOut(PlanFileOperation(FileOperationKind::Copy, {From("sub/c.png")}, folder_.Path("to")));
   WriteText(To("c.png"), "was worked on");
   EXPECT_EQ(Revert(copied.done).failures.size(), 1u);
   EXPECT_EQ(ReadText(To("c.png")), "was worked on");
@@ -88,7 +97,9 @@ TEST_F(FileOperationTest, AFolderDoesNotGoIntoItself) {
 
 TEST(UndoList, KeepsSoMany) {
   UndoList list(2);
-  const auto operation = [](const char* name) { return FileOperation{FileOperationKind::Rename, {{name, "x"}}}; };
+  const auto operation = [](const char* name) {
+    return FileOperation{FileOperationKind::Rename, {{name, "x"}}};
+  };
   for (const char* name : {"a", "b", "c"}) list.Add(operation(name));
   list.Add({});
   EXPECT_EQ(list.UndoName(), "rename of c");

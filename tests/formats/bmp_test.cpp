@@ -50,7 +50,8 @@ Bytes Indexed(const Header& header, std::string_view pixels) {
 }
 
 Bytes Os2(uint16_t width, uint16_t height, uint16_t bits, std::string_view rest) {
-  Bytes bytes = Hex("42 4D  00000000 00000000  FFFFFF7F  0C000000");  // the pixel offset is nonsense, and not used
+  // the pixel offset is nonsense, and not used
+  Bytes bytes = Hex("42 4D  00000000 00000000  FFFFFF7F  0C000000");
   for (const uint16_t value : {width, height, uint16_t{1}, bits}) AppendLittle(bytes, value, 2);
   const Bytes tail = Hex(rest);
   bytes.insert(bytes.end(), tail.begin(), tail.end());
@@ -241,12 +242,14 @@ TEST(BmpInfo, MissingFileDoesNotOpen) {
 }
 
 // A picture of one row, its alpha values 0x80 from the left on when asked for.
-PicturePointer OneRow(int32_t bitsPerPixel, std::initializer_list<int32_t> pixels, bool alpha = false) {
+PicturePointer OneRow(int32_t bitsPerPixel, std::initializer_list<int32_t> pixels,
+                      bool alpha = false) {
   PicturePointer picture = PatternPicture(static_cast<int32_t>(pixels.size()), 1, bitsPerPixel);
   int32_t x = 0;
   for (const int32_t pixel : pixels) SetPixel(picture->image, x++, 0, pixel);
   if (alpha && NewAlphaPlane(picture->width, 1, picture->alpha) == Status::Ok) {
-    for (x = 0; x < picture->width; ++x) picture->alpha.StoredRow(0)[static_cast<size_t>(x)] = static_cast<uint8_t>(0x80 + x);
+    for (x = 0; x < picture->width; ++x)
+      picture->alpha.StoredRow(0)[static_cast<size_t>(x)] = static_cast<uint8_t>(0x80 + x);
   }
   return picture;
 }
@@ -282,13 +285,17 @@ TEST(BmpWrite, HeadersOfBothDialects) {
            "00000000 00000000 00000000 00000000"),
        Hex("03020180 06050481")},
       {"alpha of an indexed picture stays out", 0, OneRow(8, {1}, true), 1082,
-       Hex("424D 3A040000 00000000 36040000  28000000 01000000 01000000 0100 0800"), Hex("01000000")},
+       Hex("424D 3A040000 00000000 36040000  28000000 01000000 01000000 0100 0800"),
+       Hex("01000000")},
       {"OS/2, 1 bit", 1, OneRow(1, {0, 1}), 36,
-       Hex("424D 24000000 00000000 20000000  0C000000 0200 0100 0100 0100  000000 FFFFFF"), Hex("40000000")},
+       Hex("424D 24000000 00000000 20000000  0C000000 0200 0100 0100 0100  000000 FFFFFF"),
+       Hex("40000000")},
       {"OS/2, 4 bits", 1, OneRow(4, {1, 2}), 78,
-       Hex("424D 4E000000 00000000 4A000000  0C000000 0200 0100 0100 0400  000000 550000 AA0000"), Hex("12000000")},
+       Hex("424D 4E000000 00000000 4A000000  0C000000 0200 0100 0100 0400  000000 550000 AA0000"),
+       Hex("12000000")},
       {"OS/2, 8 bits", 1, OneRow(8, {1, 2}), 798,
-       Hex("424D 1E030000 00000000 1A030000  0C000000 0200 0100 0100 0800  000000 550000 AA0000"), Hex("01020000")},
+       Hex("424D 1E030000 00000000 1A030000  0C000000 0200 0100 0100 0800  000000 550000 AA0000"),
+       Hex("01020000")},
       {"OS/2 has no alpha", 1, OneRow(24, {0x010203}, true), 30,
        Hex("424D 1E000000 00000000 1A000000  0C000000 0100 0100 0100 1800"), Hex("03020100")},
   };
@@ -345,7 +352,8 @@ TEST(BmpDetails, LinesOfBothDialects) {
     for (int round = 0; round < 2; ++round) {  // a second request replaces the first
       EXPECT_EQ(BmpDetails(picture), Status::Ok);
       std::vector<std::string> lines;
-      for (size_t i = 0; i < picture.detailLines.Count(); ++i) lines.emplace_back(picture.detailLines.Line(i));
+      for (size_t i = 0; i < picture.detailLines.Count(); ++i)
+        lines.emplace_back(picture.detailLines.Line(i));
       EXPECT_EQ(lines, row.lines);
     }
   }

@@ -18,7 +18,8 @@ void Put(Bytes& bytes, size_t at, uint32_t value) {
 
 // A collection of two pages of 5 x 3 and 9 x 2 pixels; the first page comes last in the file.
 Bytes Collection() {
-  const Bytes first = Encode(PcxWrite, *PatternPicture(5, 3, 8)), second = Encode(PcxWrite, *PatternPicture(9, 2, 8));
+  const Bytes first = Encode(PcxWrite, *PatternPicture(5, 3, 8)),
+              second = Encode(PcxWrite, *PatternPicture(9, 2, 8));
   Bytes file(16);
   Put(file, 0, 0x3ADE68B1);
   Put(file, 4, static_cast<uint32_t>(16 + second.size()));
@@ -33,7 +34,8 @@ TEST(Dcx, PagesAreReadByNumberEachWithItsOwnPalette) {
   WriteBytes(folder.Path("a.dcx"), Collection());
   const std::pair<int32_t, int32_t> pages[] = {{0, 5}, {1, 9}};
   for (const auto& [page, width] : pages) {
-    const PicturePointer picture = NewPictureRecord(), pattern = PatternPicture(width, page == 0 ? 3 : 2, 8);
+    const PicturePointer picture = NewPictureRecord(),
+                         pattern = PatternPicture(width, page == 0 ? 3 : 2, 8);
     const ReadRequest request{.fileName = folder.Path("a.dcx"), .page = page};
     ASSERT_EQ(DcxInfo(*picture, request), Status::Ok);
     EXPECT_EQ(picture->width, width);
@@ -61,7 +63,8 @@ TEST(Dcx, BadCollectionsAreRefused) {
       {"three bytes", Hex("B1 68 DE"), Status::FileReadError},
       {"a full directory without pages behind it", Bytes(4100, 0xB1), Status::DamagedFile},
   };
-  for (const auto& [name, file, status] : rows) EXPECT_EQ(Decode(DcxRead, file).status, status) << name;
+  for (const auto& [name, file, status] : rows)
+    EXPECT_EQ(Decode(DcxRead, file).status, status) << name;
 }
 
 }  // namespace

@@ -1,9 +1,10 @@
-// Holds for every codec of the registry, and for each new one without a line here: what it writes it reads back, broken
-// files and a failing system leave nothing half done, and progress is told.
+// Holds for every codec of the registry, and for each new one without a line here: what it writes
+// it reads back, broken files and a failing system leave nothing half done, and progress is told.
 //
-// Pictures in tests/formats/FORMAT/good are read, described and cut short; a picture REFERENCE/NAME.bmp beside them, in
-// the folder tests/formats/FORMAT/reference, says what they show. Pictures in tests/formats/FORMAT/bad have the status
-// that reading them gives before their extension: "huge-width.3.bmp".
+// Pictures in tests/formats/FORMAT/good are read, described and cut short; a picture
+// REFERENCE/NAME.bmp beside them, in the folder tests/formats/FORMAT/reference, says what they
+// show. Pictures in tests/formats/FORMAT/bad have the status that reading them gives before their
+// extension: "huge-width.3.bmp".
 
 #include <gtest/gtest.h>
 
@@ -73,7 +74,8 @@ std::string Difference(const PackedImage& a, const PackedImage& b) {
   if (a.Width() != b.Width() || a.Height() != b.Height()) return "size";
   for (int32_t y = 0; y < a.Height(); ++y) {
     for (int32_t x = 0; x < a.Width(); ++x) {
-      if (ColorAt(a, x, y) != ColorAt(b, x, y)) return "column " + std::to_string(x) + ", row " + std::to_string(y);
+      if (ColorAt(a, x, y) != ColorAt(b, x, y))
+        return "column " + std::to_string(x) + ", row " + std::to_string(y);
     }
   }
   return {};
@@ -179,7 +181,8 @@ TEST(EveryCodec, KeepsAlphaThatItsRowPromises) {
     const PicturePointer picture = PatternPicture(33, 7, 24);
     ASSERT_EQ(NewAlphaPlane(33, 7, picture->alpha), Status::Ok);
     for (int32_t y = 0; y < 7; ++y) {
-      for (int32_t x = 0; x < 33; ++x) picture->alpha.Row(y)[static_cast<size_t>(x)] = static_cast<uint8_t>(x * 8 + y);
+      for (int32_t x = 0; x < 33; ++x)
+        picture->alpha.Row(y)[static_cast<size_t>(x)] = static_cast<uint8_t>(x * 8 + y);
     }
     picture->alphaFlags = kHasAlpha;
     const std::string path = folder.Path("picture." + LowerCase(row.extension.view()));
@@ -206,7 +209,8 @@ TEST(EveryCodec, ReadsGoodPictures) {
     EXPECT_EQ(described->width, picture->image.Width());
     EXPECT_EQ(described->height, picture->image.Height());
     const fs::path path(file);
-    const fs::path reference = path.parent_path().parent_path() / "reference" / path.filename().replace_extension(".bmp");
+    const fs::path reference =
+        path.parent_path().parent_path() / "reference" / path.filename().replace_extension(".bmp");
     if (!fs::exists(reference)) continue;
     PicturePointer expected;
     ASSERT_EQ(LoadPicture(RequestFor(reference), expected), Status::Ok);
@@ -231,7 +235,8 @@ TEST(EveryCodec, RefusesBadPictures) {
   }
 }
 
-// Info, details and reading of a file that may be anything: never a picture together with a failure.
+// Info, details and reading of a file that may be anything: never a picture together with a
+// failure.
 void ExpectClean(const FormatEntry& row, const std::string& path) {
   const PicturePointer picture = NewPictureRecord();
   picture->fileName.AssignCut(path);
@@ -282,7 +287,8 @@ TEST(EveryCodec, FailedWriteLeavesTheDestinationAlone) {
     const TemporaryFolder folder;
     const std::string name = "picture." + LowerCase(row.extension.view());
     const PicturePointer picture =
-        PatternPicture(HoldsOneSize(row) ? 256 : 33, HoldsOneSize(row) ? 240 : 20, static_cast<int32_t>(row.maxBits));
+        PatternPicture(HoldsOneSize(row) ? 256 : 33, HoldsOneSize(row) ? 240 : 20,
+                       static_cast<int32_t>(row.maxBits));
     picture->fileName.AssignCut(folder.Path(name));
     const int64_t faults = ForEachFault([&] {
       WriteText(folder.Path(name), "old");

@@ -17,12 +17,15 @@ std::vector<std::string> LinesOf(const std::vector<uint8_t>& block) {
   CollectedLines sink;
   WalkExif(block, &sink);
   // Where directories lie, and how, differs.
-  std::erase_if(sink.lines, [](const std::string& line) { return line.find(" tag=") != std::string::npos; });
+  std::erase_if(sink.lines,
+                [](const std::string& line) { return line.find(" tag=") != std::string::npos; });
   return sink.lines;
 }
 
 // What is told of the picture: without the layout of a first directory and without the thumbnail.
-std::vector<std::string> PictureLines(const std::vector<uint8_t>& block) { return LinesOf(MakeExifBlock(ParseExifBlock(block))); }
+std::vector<std::string> PictureLines(const std::vector<uint8_t>& block) {
+  return LinesOf(MakeExifBlock(ParseExifBlock(block)));
+}
 
 TEST(ExifDirectories, TravelThroughFilesOfDirectories) {
   struct Row {
@@ -62,7 +65,8 @@ TEST(ExifDirectories, DamagedBlocksAreTakenAsFarAsTheyGo) {
     const std::vector<uint8_t> made = MakeExifBlock(directories);
     EXPECT_EQ(MakeExifBlock(ParseExifBlock(made)), made) << length;
   }
-  // A value that would begin in front of its own end, a directory that leads to itself, a count that no file holds.
+  // A value that would begin in front of its own end, a directory that leads to itself, a count
+  // that no file holds.
   EXPECT_TRUE(ParseExifBlock(Hex("4949 2A00 08000000 0100 0F01 0200 FFFFFFFF FFFFFFFF")).first.empty());
   EXPECT_EQ(ParseExifBlock(Hex("4949 2A00 08000000 0100 6987 0400 01000000 08000000 00000000")).exif.size(), 0u);
 }

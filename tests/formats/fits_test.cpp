@@ -26,7 +26,8 @@ std::string Cards(std::string_view texts) {
 
 // A header of those cards between SIMPLE and END, with blanks up to the data.
 std::string Header(const std::string& texts) {
-  std::string header = Cards(std::string("SIMPLE  =                    T|").append(texts).append("|END"));
+  std::string header =
+      Cards(std::string("SIMPLE  =                    T|").append(texts).append("|END"));
   return header.append((2880 - header.size() % 2880) % 2880, ' ');
 }
 
@@ -92,7 +93,8 @@ TEST(Fits, GrayOfEveryLevelFollowsTheFormula) {
   Bytes row, expected;
   for (unsigned i = 0; i < 3 * 1024 + 13; ++i) {
     const unsigned level = i % 256, others = i * 7 / 3 % 256, blue = i < 256 ? level : others,
-                   green = i / 256 == 1 ? level : 255 - others, red = i / 256 == 2 ? level : others / 2;
+                   green = i / 256 == 1 ? level : 255 - others,
+                   red = i / 256 == 2 ? level : others / 2;
     for (const unsigned value : {blue, green, red}) row.push_back(static_cast<uint8_t>(value));
     expected.push_back(static_cast<uint8_t>(red * 30 / 100 + green * 59 / 100 + blue * 11 / 100));
   }
@@ -101,7 +103,8 @@ TEST(Fits, GrayOfEveryLevelFollowsTheFormula) {
 }
 
 TEST(Fits, ReadsHeaders) {
-  constexpr Status kOk = Status::Ok, kDamaged = Status::DamagedFile, kShort = Status::FileReadError, kNone = Status::NoImages;
+  constexpr Status kOk = Status::Ok, kDamaged = Status::DamagedFile, kShort = Status::FileReadError,
+                   kNone = Status::NoImages;
   const std::string plain = Header("BITPIX  = 8|NAXIS   = 2|NAXIS1  = 2|NAXIS2  = 3");
   const std::string size1 = "|NAXIS1=1|NAXIS2=1", huge = "2147483647";
   // clang-format off
@@ -169,7 +172,8 @@ TEST(Fits, FindsTheEndOfTheHeader) {
   const std::string path = folder.Path("cards.fits");
   for (const auto& row : rows) {
     SCOPED_TRACE(row.cards);
-    std::string file = Cards("SIMPLE|BITPIX=8|NAXIS1=1|NAXIS2=1") + std::string((row.cards - 4) * 80, ' ') + Cards("END");
+    std::string file = Cards("SIMPLE|BITPIX=8|NAXIS1=1|NAXIS2=1") +
+                       std::string((row.cards - 4) * 80, ' ') + Cards("END");
     file.resize((file.size() + 2879) / 2880 * 2880, ' ');
     WriteText(path, file + "a");
     const PicturePointer picture = NewPictureRecord();
@@ -212,12 +216,15 @@ TEST(Fits, DetailsListTheCards) {
   const std::string path = folder.Path("details.fits");
   picture->fileName.AssignCut(path);
   EXPECT_EQ(FitsDetails(*picture), Status::FileOpenError);
-  WriteText(path, Cards("SIMPLE  =                    T / a comment that goes on and on|NAXIS1  = 5||=x|END|AFTER = 1"));
+  WriteText(path, Cards("SIMPLE  =                    T / a comment that goes on and on|NAXIS1  = "
+                        "5||=x|END|AFTER = 1"));
   ASSERT_EQ(FitsDetails(*picture), Status::Ok);
-  const std::string_view expected[] = {"SIMPLE = T / a comment that goes on ", "NAXIS1 = 5                          ", " = ",
+  const std::string_view expected[] = {"SIMPLE = T / a comment that goes on ",
+                                       "NAXIS1 = 5                          ", " = ",
                                        " = x                                ", "END = "};
   ASSERT_EQ(picture->detailLines.Count(), std::size(expected));
-  for (size_t i = 0; i < std::size(expected); ++i) EXPECT_EQ(picture->detailLines.Line(i), expected[i]);
+  for (size_t i = 0; i < std::size(expected); ++i)
+    EXPECT_EQ(picture->detailLines.Line(i), expected[i]);
 
   WriteText(path, std::string(40 * 80, 'K'));
   ASSERT_EQ(FitsDetails(*picture), Status::Ok);
@@ -226,12 +233,15 @@ TEST(Fits, DetailsListTheCards) {
 }
 
 TEST(Fits, AgreesWithNetpbm) {
-  if (!HasProgram("fitstopnm") || !HasProgram("pamtofits")) GTEST_SKIP() << "netpbm is not installed";
+  if (!HasProgram("fitstopnm") || !HasProgram("pamtofits"))
+    GTEST_SKIP() << "netpbm is not installed";
   const TemporaryFolder folder;
-  const std::string ours = folder.Path("ours.fits"), theirs = folder.Path("theirs.fits"), seen = folder.Path("seen.pgm");
+  const std::string ours = folder.Path("ours.fits"), theirs = folder.Path("theirs.fits"),
+                    seen = folder.Path("seen.pgm");
   std::vector<Bytes> rows;
   for (uint32_t y = 0; y < 29; ++y) rows.push_back(RandomBytes(3 * 37, y));
-  const PicturePointer picture = MakePicture(37, 29, 24, rows), own = NewPictureRecord(), again = NewPictureRecord();
+  const PicturePointer picture = MakePicture(37, 29, 24, rows), own = NewPictureRecord(),
+                       again = NewPictureRecord();
   picture->fileName.AssignCut(ours);
   ASSERT_EQ(FitsWrite(*picture, {}), Status::Ok);
   ASSERT_EQ(FitsRead(*own, {.fileName = ours}), Status::Ok);

@@ -18,7 +18,9 @@ constexpr const char* kPalette = "000000 FF0000 00FF00 0000FF ";
 // LZW of 2-bit pixels: clear, 1 2 / 3 0, end.
 constexpr const char* kFourPixels = "02 03 8C 06 05 00 ";
 
-Bytes Gif(const std::string& screen, const std::string& blocks) { return Hex("474946383961" + screen + blocks + "3B"); }
+Bytes Gif(const std::string& screen, const std::string& blocks) {
+  return Hex("474946383961" + screen + blocks + "3B");
+}
 
 TEST(GifRead, Frames) {
   const std::string screen = "0200 0200 81 00 00 " + std::string(kPalette);
@@ -32,26 +34,35 @@ TEST(GifRead, Frames) {
   };
   const Row rows[] = {
       {"palette of four", Gif(screen, place + "00 " + kFourPixels), Status::Ok, "1 2 / 3 0", ""},
-      {"a transparent index becomes alpha", Gif(screen, "21 F9 04 01 0000 02 00 " + place + "00 " + kFourPixels), Status::Ok,
+      {"a transparent index becomes alpha",
+       Gif(screen, "21 F9 04 01 0000 02 00 " + place + "00 " + kFourPixels), Status::Ok,
        "FF0000 000000 / 0000FF 000000", "255 0 / 255 255"},
-      {"local palette", Gif("0200 0200 00 00 00", place + "81 " + kPalette + kFourPixels), Status::Ok, "1 2 / 3 0", ""},
-      {"no palette reads as grays", Gif("0200 0200 00 00 00", place + "00 " + kFourPixels), Status::Ok, "1 2 / 3 0", ""},
+      {"local palette", Gif("0200 0200 00 00 00", place + "81 " + kPalette + kFourPixels),
+       Status::Ok, "1 2 / 3 0", ""},
+      {"no palette reads as grays", Gif("0200 0200 00 00 00", place + "00 " + kFourPixels),
+       Status::Ok, "1 2 / 3 0", ""},
       {"a frame smaller than the screen",
-       Gif("0300 0200 81 00 00 " + std::string(kPalette), "2C 0100 0000 0200 0200 00 " + std::string(kFourPixels)), Status::Ok,
-       "000000 FF0000 00FF00 / 000000 0000FF 000000", "0 255 255 / 0 255 255"},
+       Gif("0300 0200 81 00 00 " + std::string(kPalette),
+           "2C 0100 0000 0200 0200 00 " + std::string(kFourPixels)),
+       Status::Ok, "000000 FF0000 00FF00 / 000000 0000FF 000000", "0 255 255 / 0 255 255"},
       {"a frame beyond the screen is cut",
-       Gif("0200 0200 81 00 00 " + std::string(kPalette), "2C 0100 0100 0200 0200 00 " + std::string(kFourPixels)), Status::Ok,
-       "000000 000000 / 000000 FF0000", "0 0 / 0 255"},
-      {"a screen without size", Gif("0000 0000 81 00 00 " + std::string(kPalette), place + "00 " + kFourPixels), Status::Ok,
+       Gif("0200 0200 81 00 00 " + std::string(kPalette),
+           "2C 0100 0100 0200 0200 00 " + std::string(kFourPixels)),
+       Status::Ok, "000000 000000 / 000000 FF0000", "0 0 / 0 255"},
+      {"a screen without size",
+       Gif("0000 0000 81 00 00 " + std::string(kPalette), place + "00 " + kFourPixels), Status::Ok,
        "1 2 / 3 0", ""},
-      {"stray bytes and unknown extensions", Gif(screen, "00 21 42 02 AA BB 00 00 " + place + "00 " + kFourPixels), Status::Ok,
+      {"stray bytes and unknown extensions",
+       Gif(screen, "00 21 42 02 AA BB 00 00 " + place + "00 " + kFourPixels), Status::Ok,
        "1 2 / 3 0", ""},
       {"no end code", Gif(screen, place + "00 02 02 8C 06 00"), Status::Ok, "1 2 / 3 0", ""},
       {"pixels are missing", Gif(screen, place + "00 02 01 8C 00"), Status::FileReadError, "", ""},
       {"a code that cannot be", Gif(screen, place + "00 02 01 3C 00"), Status::DamagedFile, "", ""},
       {"no picture", Gif(screen, ""), Status::NoImages, "", ""},
-      {"an empty frame", Gif(screen, "2C 0000 0000 0000 0200 00 02 00"), Status::DamagedFile, "", ""},
-      {"codes wider than the pixels", Gif(screen, place + "00 09 08 00 06 20 C0 00 00 04 08 00"), Status::Ok, "1 2 / 3 0", ""},
+      {"an empty frame", Gif(screen, "2C 0000 0000 0000 0200 00 02 00"), Status::DamagedFile, "",
+       ""},
+      {"codes wider than the pixels", Gif(screen, place + "00 09 08 00 06 20 C0 00 00 04 08 00"),
+       Status::Ok, "1 2 / 3 0", ""},
       {"pixels of 13 bits", Gif(screen, place + "00 0D 01 00 00"), Status::DamagedFile, "", ""},
       {"not a GIF", Hex("4749463838610200020000"), Status::DamagedFile, "", ""},
   };
@@ -65,7 +76,8 @@ TEST(GifRead, Frames) {
 }
 
 TEST(GifRead, LaterFramesStandOnTheOnesBefore) {
-  // Two by one: red red, then a green pixel at the right with each disposal, then a blue one at the left.
+  // Two by one: red red, then a green pixel at the right with each disposal, then a blue one at the
+  // left.
   const auto file = [](const char* disposal) {
     return Gif("0200 0100 81 00 00 " + std::string(kPalette),
                "2C 0000 0000 0200 0100 00 02 02 4C 0A 00 "
@@ -105,7 +117,8 @@ TEST(GifWrite, LongStringsAndFullTablesComeBack) {
     for (const int32_t bits : {1, 4, 8}) {
       SCOPED_TRACE(std::to_string(bits) + (interlaced ? " interlaced" : ""));
       const PicturePointer picture = PatternPicture(257, 211, bits);
-      uint32_t seed = 1;  // noise fills the table several times, the flat part makes strings of thousands
+      // noise fills the table several times, the flat part makes strings of thousands
+      uint32_t seed = 1;
       for (int32_t y = 0; y < 150; ++y) {
         for (int32_t x = 0; x < 257; ++x) {
           seed = seed * 1664525 + 1013904223;

@@ -18,8 +18,10 @@ namespace {
 TEST(Hdp, QuantizerZeroKeepsEveryPixelAndOthersStayClose) {
   if (!HdpWorksHere()) GTEST_SKIP() << "libjxr is not installed";
   const ScopedSettings scoped;
-  // A maker's name without the zero that ends a text: the peer does not read on where it is missing.
-  const std::vector<uint8_t> unendedText = Hex("4949 2A00 08000000  0100 0F01 0200 05000000 1A000000 00000000  4B6F64616B");
+  // A maker's name without the zero that ends a text: the peer does not read on where it is
+  // missing.
+  const std::vector<uint8_t> unendedText =
+      Hex("4949 2A00 08000000  0100 0F01 0200 05000000 1A000000 00000000  4B6F64616B");
   struct Row {
     int32_t compression, options;
     bool exact;
@@ -34,7 +36,8 @@ TEST(Hdp, QuantizerZeroKeepsEveryPixelAndOthersStayClose) {
         for (size_t i = 0; i < 768; ++i) picture->palette[i] = static_cast<uint8_t>(i / 3);
         const PicturePointer same = PatternPicture(45, 37, bits);
         ASSERT_EQ(NewPackedImage(45, 37, &picture->palette, 8, picture->image), Status::Ok);
-        for (int32_t y = 0; y < 37; ++y) std::copy_n(same->image.Row(y).data(), 45, picture->image.Row(y).data());
+        for (int32_t y = 0; y < 37; ++y)
+          std::copy_n(same->image.Row(y).data(), 45, picture->image.Row(y).data());
       }
       picture->metadata.exif = unendedText;
       const std::vector<uint8_t> file = Encode(HdpWrite, *picture);
@@ -55,13 +58,17 @@ TEST(Hdp, QuantizerZeroKeepsEveryPixelAndOthersStayClose) {
 // The library trusts its input and often does not survive it; the program must.
 TEST(Hdp, DamagedDataNeverEndTheProgram) {
   if (!HdpWorksHere()) GTEST_SKIP() << "libjxr is not installed";
-  const std::vector<uint8_t> good = ReadBytes(SourcePath("tests/formats/hdp/good/lossless-by-frequency.wdp"));
+  const std::vector<uint8_t> good =
+      ReadBytes(SourcePath("tests/formats/hdp/good/lossless-by-frequency.wdp"));
   uint32_t state = 1;
-  const auto next = [&state](size_t below) { return (state = state * 1664525 + 1013904223) / 65536 % below; };
+  const auto next = [&state](size_t below) {
+    return (state = state * 1664525 + 1013904223) / 65536 % below;
+  };
   int failures = 0;
   for (int turn = 0; turn < 200; ++turn) {
     std::vector<uint8_t> file = good;
-    for (int i = 0; i < 2; ++i) file[300 + next(file.size() - 300)] = static_cast<uint8_t>(next(256));
+    for (int i = 0; i < 2; ++i)
+      file[300 + next(file.size() - 300)] = static_cast<uint8_t>(next(256));
     const Decoded decoded = Decode(HdpRead, file);
     EXPECT_EQ(decoded.picture->image.Empty(), decoded.status != Status::Ok) << turn;
     failures += decoded.status != Status::Ok;
@@ -102,7 +109,8 @@ TEST(Hdp, DirectoriesThatLeadBackToThemselvesEnd) {
     const size_t at = static_cast<size_t>(file[4] | file[5] << 8);
     return at + 2 + 12 * static_cast<size_t>(file[at]);
   }();
-  std::copy_n(file.begin() + 4, 4, file.begin() + static_cast<ptrdiff_t>(link));  // it leads back to itself
+  // it leads back to itself
+  std::copy_n(file.begin() + 4, 4, file.begin() + static_cast<ptrdiff_t>(link));
   const Decoded info = Describe(HdpInfo, file);
   EXPECT_EQ(info.status, Status::Ok);
   EXPECT_EQ(info.picture->pageCount, 1);

@@ -16,11 +16,13 @@ namespace {
 using Bytes = std::vector<uint8_t>;
 
 // A directory of one entry for the picture that follows.
-std::string OneIcon(const std::string& picture) { return "0000 0100 0100  02 01 00 00 0100 2000 FFFFFFFF 16000000 " + picture; }
+std::string OneIcon(const std::string& picture) {
+  return "0000 0100 0100  02 01 00 00 0100 2000 FFFFFFFF 16000000 " + picture;
+}
 // A bitmap header of two pixels by one.
 std::string Bitmap(const char* bits, const std::string& rest) {
-  return std::string("28000000 02000000 02000000 0100 ") + bits + " 00000000 00000000 00000000 00000000 00000000 00000000 " +
-         rest;
+  return std::string("28000000 02000000 02000000 0100 ") + bits +
+         " 00000000 00000000 00000000 00000000 00000000 00000000 " + rest;
 }
 
 TEST(IcoRead, Entries) {
@@ -78,17 +80,20 @@ TEST(IcoRead, TheLargestThenDeepestEntryWinsAndPagesSelect) {
 
 // PNG entries of one size: the directory tells how deep they are.
 TEST(IcoRead, OfEqualSizesTheDeepestWins) {
-  const auto shallow = Encode(PngWrite, *PatternPicture(20, 20, 4)), deep = Encode(PngWrite, *PatternPicture(20, 20, 24));
+  const auto shallow = Encode(PngWrite, *PatternPicture(20, 20, 4)),
+             deep = Encode(PngWrite, *PatternPicture(20, 20, 24));
   const auto entry = [](uint8_t bits, size_t size, size_t offset) {
     std::vector<uint8_t> bytes = {20, 20, 0, 0, 1, 0, bits, 0};
     for (const size_t value : {size, offset}) {
-      for (int shift = 0; shift < 32; shift += 8) bytes.push_back(static_cast<uint8_t>(value >> shift));
+      for (int shift = 0; shift < 32; shift += 8)
+        bytes.push_back(static_cast<uint8_t>(value >> shift));
     }
     return bytes;
   };
   std::vector<uint8_t> file = {0, 0, 1, 0, 2, 0};
   constexpr size_t kPictures = 6 + 2 * 16;
-  for (const auto& part : {entry(4, shallow.size(), kPictures), entry(32, deep.size(), kPictures + shallow.size()), shallow, deep}) {
+  for (const auto& part : {entry(4, shallow.size(), kPictures),
+                           entry(32, deep.size(), kPictures + shallow.size()), shallow, deep}) {
     file.insert(file.end(), part.begin(), part.end());
   }
   const Decoded decoded = Decode(IcoRead, file);

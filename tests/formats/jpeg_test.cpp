@@ -21,7 +21,8 @@ PicturePointer SmoothPicture(int32_t width, int32_t height) {
   PicturePointer picture = PatternPicture(width, height, 24);
   for (int32_t y = 0; y < height; ++y) {
     for (int32_t x = 0; x < width; ++x) {
-      SetPixel(picture->image, x, y, (x * 255 / width) << 16 | (y * 255 / height) << 8 | (255 - x * 255 / width));
+      SetPixel(picture->image, x, y,
+               (x * 255 / width) << 16 | (y * 255 / height) << 8 | (255 - x * 255 / width));
     }
   }
   return picture;
@@ -32,7 +33,8 @@ int32_t LargestError(const PackedImage& a, const PackedImage& b) {
   for (int32_t y = 0; y < a.Height(); ++y) {
     for (int32_t x = 0; x < a.Width(); ++x) {
       for (const int32_t shift : {0, 8, 16}) {
-        largest = std::max(largest, std::abs((a.PixelAt(x, y) >> shift & 255) - (b.PixelAt(x, y) >> shift & 255)));
+        largest = std::max(
+            largest, std::abs((a.PixelAt(x, y) >> shift & 255) - (b.PixelAt(x, y) >> shift & 255)));
       }
     }
   }
@@ -43,7 +45,8 @@ TEST(Jpeg, PicturesComeBackCloselyInEveryForm) {
   const ScopedSettings scoped;
   const PicturePointer picture = SmoothPicture(65, 49);
   settings.JpegCompression = 95;
-  for (const int32_t sampling : {choice::kSubsample444, choice::kSubsample422, choice::kSubsample420}) {
+  for (const int32_t sampling :
+       {choice::kSubsample444, choice::kSubsample422, choice::kSubsample420}) {
     for (const int32_t progressive : {0, 1}) {
       SCOPED_TRACE(std::to_string(sampling) + (progressive != 0 ? " progressive" : ""));
       settings.JpegSubsample = sampling;
@@ -71,7 +74,8 @@ TEST(Jpeg, MetadataTravel) {
   picture->metadata.exif = Hex("49492A00 08000000 0000 00000000");
   picture->metadata.xmp = {'<', 'x', '/', '>'};
   picture->metadata.icc.resize(150000);  // three segments
-  for (size_t i = 0; i < picture->metadata.icc.size(); ++i) picture->metadata.icc[i] = static_cast<uint8_t>(i * 7 >> 3);
+  for (size_t i = 0; i < picture->metadata.icc.size(); ++i)
+    picture->metadata.icc[i] = static_cast<uint8_t>(i * 7 >> 3);
   picture->metadata.dpiX = picture->metadata.dpiY = 200;
   picture->comment = {'h', 'i'};
   const Decoded back = Decode(JpegRead, Encode(JpegWrite, *picture));
@@ -113,15 +117,16 @@ TEST(Jpeg, FaultsThatArePassedOverAreTold) {
   EXPECT_FALSE(noted.picture->note.empty());
 }
 
-// A file of one block, 8 x 8, in which every component has one value. Huffman codes: 0 for 7 bits that follow, 10 for 8 bits,
-// 110 for the value 128 and, behind each, 0 for nothing more.
+// A file of one block, 8 x 8, in which every component has one value. Huffman codes: 0 for 7 bits
+// that follow, 10 for 8 bits, 110 for the value 128 and, behind each, 0 for nothing more.
 Bytes OneBlock(const char* frame, const Bytes& scans) {
   Bytes file = Hex("FFD8  FFDB 0043 00");
   file.insert(file.end(), 64, 8);  // every step is 8, so that a coefficient is the value less 128
   const Bytes tables =
       Hex("FFC4 0016 00 010101 00000000000000000000000000 070800"
           "FFC4 0014 10 01 000000000000000000000000000000 00");
-  for (const Bytes& part : {tables, Hex(frame), scans, Hex("FFD9")}) file.insert(file.end(), part.begin(), part.end());
+  for (const Bytes& part : {tables, Hex(frame), scans, Hex("FFD9")})
+    file.insert(file.end(), part.begin(), part.end());
   return file;
 }
 
@@ -137,7 +142,8 @@ TEST(Jpeg, InkBecomesLight) {
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.name);
-    const std::string frame = std::string(row.adobe) + "FFC0 0014 08 0008 0008 04 011100 021100 031100 041100";
+    const std::string frame =
+        std::string(row.adobe) + "FFC0 0014 08 0008 0008 04 011100 021100 031100 041100";
     const std::string scan = std::string("FFDA 000E 04 0100 0200 0300 0400 003F00") + row.data;
     const Decoded decoded = Decode(JpegRead, OneBlock(frame.c_str(), Hex(scan)));
     ASSERT_EQ(decoded.status, Status::Ok);
@@ -168,7 +174,8 @@ TEST(Jpeg, ThumbnailsDecodeAtTheSmallestSizeThatServes) {
   struct Row {
     int32_t side, width;
   };
-  for (const Row& row : {Row{0, 800}, Row{96, 200}, Row{50, 100}, Row{10, 100}, Row{201, 800}, Row{200, 400}}) {
+  for (const Row& row :
+       {Row{0, 800}, Row{96, 200}, Row{50, 100}, Row{10, 100}, Row{201, 800}, Row{200, 400}}) {
     SCOPED_TRACE(row.side);
     const PicturePointer picture = NewPictureRecord();
     ASSERT_EQ(JpegRead(*picture, {.fileName = folder.Path("a.jpg"), .thumbnailSide = row.side}), Status::Ok);

@@ -218,11 +218,14 @@ TEST(Mac, RefusesWithItsStatus) {
 
 // The same pictures in the eyes of netpbm, both ways.
 TEST(Mac, AgreesWithNetpbm) {
-  if (!HasProgram("macptopbm") || !HasProgram("pbmtomacp")) GTEST_SKIP() << "netpbm is not installed";
+  if (!HasProgram("macptopbm") || !HasProgram("pbmtomacp"))
+    GTEST_SKIP() << "netpbm is not installed";
   const TemporaryFolder folder;
-  const std::string ours = folder.Path("ours.mac"), theirs = folder.Path("theirs.mac"), seen = folder.Path("seen.pbm");
+  const std::string ours = folder.Path("ours.mac"), theirs = folder.Path("theirs.mac"),
+                    seen = folder.Path("seen.pbm");
   std::vector<Bytes> rows;
-  for (uint32_t y = 0; y < kRows; ++y) rows.push_back(Join({RandomBytes(y % 73, y), Times(kRow - y % 73, uint8_t(y))}));
+  for (uint32_t y = 0; y < kRows; ++y)
+    rows.push_back(Join({RandomBytes(y % 73, y), Times(kRow - y % 73, uint8_t(y))}));
   const PicturePointer picture = MakePicture(576, 720, 1, rows);
   ASSERT_TRUE(picture->fileName.Assign(ours));
   const ScopedSettings scoped;

@@ -22,13 +22,16 @@ struct ReadRow {
 };
 
 TEST(OldBitmaps, AreReadAsTheirMakersMeantThem) {
-  const std::string ras8 = "59A66A95 00000003 00000002 00000008 00000000 ", ras24 = "59A66A95 00000001 00000001 00000018 00000000 ";
+  const std::string ras8 = "59A66A95 00000003 00000002 00000008 00000000 ",
+                    ras24 = "59A66A95 00000001 00000001 00000018 00000000 ";
   const std::string plainMap = "00000001 00000000 00000000 ", coded = "00000002 00000000 00000000 ";
   const std::string rest = " 0000 0000 0000 0000 0000 0000 0000 0000 0000 0000 0000 0000";
   const std::string gray = ras8 + plainMap + "01 02 03 00  04 05 06 00";
   const std::string runs = ras8 + coded + "80 04 09 80 00 01 07";
-  const std::string mapped = ras8 + "00000001 00000001 00000006  10 20  30 40  50 60  00 01 00 00  01 01 01 00";
-  const std::string blueFirst = ras24 + plainMap + "03 02 01 00", redFirst = ras24 + "00000003 00000000 00000000 01 02 03 00";
+  const std::string mapped =
+      ras8 + "00000001 00000001 00000006  10 20  30 40  50 60  00 01 00 00  01 01 01 00";
+  const std::string blueFirst = ras24 + plainMap + "03 02 01 00",
+                    redFirst = ras24 + "00000003 00000000 00000000 01 02 03 00";
   const std::string cut = ras24 + plainMap + "03 02";
   const std::string paint1 = "44616E4D 0900 0200" + rest + "FF 80  00 00";
   const std::string paint2 = "4C696E53 1800 0300" + rest + "0300 0000 0300  00 03 55  02 01 02";

@@ -16,8 +16,10 @@ Bytes EncodePlainly(const Bytes& plane) {
   Bytes out;
   for (size_t i = 0; i < plane.size();) {
     size_t equal = 0;
-    while (i + equal + 1 < plane.size() && equal < 63 && plane[i + equal] == plane[i + equal + 1]) ++equal;
-    if (equal > 0 || plane[i] >= 0xC0) out.push_back(static_cast<uint8_t>(0xC0 + std::max<size_t>(equal, 1)));
+    while (i + equal + 1 < plane.size() && equal < 63 && plane[i + equal] == plane[i + equal + 1])
+      ++equal;
+    if (equal > 0 || plane[i] >= 0xC0)
+      out.push_back(static_cast<uint8_t>(0xC0 + std::max<size_t>(equal, 1)));
     out.push_back(plane[i]);
     i += std::max<size_t>(equal, 1);
   }
@@ -59,7 +61,8 @@ TEST(PcxRuns, EncodesAsDefined) {
   for (const Kind& kind : kKinds) {
     for (uint32_t seed = 1; seed <= 300; ++seed) {
       SCOPED_TRACE(std::string(kind.name) + ", " + std::to_string(seed));
-      const Bytes plane = Plane(seed <= 200 ? seed : 40 * seed, seed, kind.first, kind.values, kind.repeatPercent);
+      const Bytes plane =
+          Plane(seed <= 200 ? seed : 40 * seed, seed, kind.first, kind.values, kind.repeatPercent);
       Bytes out(2 * plane.size() + 1, 0xEE);
       out.resize(EncodePcxPlane(plane, out.data()) + 1);
       out.pop_back();

@@ -160,7 +160,8 @@ TEST(PcxInfo, PaletteByVersionAndDepth) {
 // An 8-bit picture of one row.
 PicturePointer OneRow(const Bytes& pixels, int32_t bitsPerPixel = 8) {
   PicturePointer picture = PatternPicture(static_cast<int32_t>(pixels.size()), 1, bitsPerPixel);
-  for (size_t x = 0; x < pixels.size(); ++x) SetPixel(picture->image, static_cast<int32_t>(x), 0, pixels[x]);
+  for (size_t x = 0; x < pixels.size(); ++x)
+    SetPixel(picture->image, static_cast<int32_t>(x), 0, pixels[x]);
   return picture;
 }
 
@@ -205,12 +206,14 @@ TEST(PcxWrite, WholeFiles) {
   const Row rows[] = {
       {"1 bit",
        OneRow({1, 0, 1, 1, 1, 1, 1, 1, 1}, 1),
-       Hex("0A 05 01 01  0000 0000 0800 0000  2C01 2C01  000000 FFFFFF" + std::string(84, '0') + "00 01 0200 0100" + zeros),
+       Hex("0A 05 01 01  0000 0000 0800 0000  2C01 2C01  000000 FFFFFF" + std::string(84, '0') +
+           "00 01 0200 0100" + zeros),
        Hex("BF 80"),
        {}},
       {"2 bits in 2 planes",
        OneRow({0, 1, 2, 3}, 2),
-       Hex("0A 05 01 01  0000 0000 0300 0000  2C01 2C01  000000 000055 0000AA 0000FF 002400 002455 0024AA 0024FF"
+       Hex("0A 05 01 01  0000 0000 0300 0000  2C01 2C01  000000 000055 0000AA 0000FF 002400 002455 "
+           "0024AA 0024FF"
            "004800 004855 0048AA 0048FF 006C00 006C55 006CAA 006CFF  00 02 0100 0100" +
            zeros),
        Hex("50 30"),
@@ -220,11 +223,12 @@ TEST(PcxWrite, WholeFiles) {
        Hex("0A 05 01 01  0000 0000 0800 0000"),
        Hex("88 00 48 00 28 00 18 80"),
        {}},
-      {"7 bits in one plane, odd line", OneRow({1, 2, 127}, 7), Hex("0A 05 01 08  0000 0000 0200 0000"), Hex("01 02 7F"),
-       Hex("0C 000000 000055 0000AA")},
+      {"7 bits in one plane, odd line", OneRow({1, 2, 127}, 7),
+       Hex("0A 05 01 08  0000 0000 0200 0000"), Hex("01 02 7F"), Hex("0C 000000 000055 0000AA")},
       {"24 bits",
        OneRow({1, 2}, 24),
-       Hex("0A 05 01 08  0000 0000 0100 0000  2C01 2C01  000000 000055 0000AA 0000FF 002400 002455 0024AA 0024FF"
+       Hex("0A 05 01 08  0000 0000 0100 0000  2C01 2C01  000000 000055 0000AA 0000FF 002400 002455 "
+           "0024AA 0024FF"
            "004800 004855 0048AA 0048FF 006C00 006C55 006CAA 006CFF  00 03 0200 0000" +
            zeros),
        Hex("C1 00 00 C1 00 00 01 02"),

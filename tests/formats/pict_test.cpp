@@ -9,18 +9,25 @@ namespace fotomill::test {
 namespace {
 
 // A version 2 picture of 1 row and 2 columns without the preamble.
-const std::string kHead = "0000 0000 0000 0001 0002  0011 02FF  0C00 FFFE 0000 00480000 00480000 0000 0000 0001 0002 00000000 ";
+const std::string kHead =
+    "0000 0000 0000 0001 0002  0011 02FF  0C00 FFFE 0000 00480000 00480000 0000 0000 0001 0002 "
+    "00000000 ";
 const std::string kSquares = " 0000 0000 0001 0002  0000 0000 0001 0002  0000 ";
 
 // A direct pixel map: bytes of a row and pack type, then bits and parts.
-std::string Direct(const char* rowBytes, const char* packType, const char* bits, const char* parts) {
-  return std::string(" 009A 000000FF ") + rowBytes + " 0000 0000 0001 0002 0000 " + packType + " 00000000 00480000 00480000 0010 " + bits +
-         " " + parts + " 0008 00000000 00000000 00000000 " + kSquares;
+std::string Direct(const char* rowBytes, const char* packType, const char* bits,
+                   const char* parts) {
+  return std::string(" 009A 000000FF ") + rowBytes + " 0000 0000 0001 0002 0000 " + packType +
+         " 00000000 00480000 00480000 0010 " + bits + " " + parts +
+         " 0008 00000000 00000000 00000000 " + kSquares;
 }
 
 TEST(PictRead, Kinds) {
-  const std::string map = " 0098 8008 0000 0000 0001 0002 0000 0000 00000000 00480000 00480000 0000 0008 0001 0008 00000000 00000000 00000000"
-                          " 00000000 0000 0001  0000 1111 2222 3333  0001 4444 5555 6666 " + kSquares;
+  const std::string map =
+      " 0098 8008 0000 0000 0001 0002 0000 0000 00000000 00480000 00480000 0000 0008 0001 0008 "
+      "00000000 00000000 00000000"
+      " 00000000 0000 0001  0000 1111 2222 3333  0001 4444 5555 6666 " +
+      kSquares;
   struct Row {
     const char* name;
     std::string file;
@@ -56,10 +63,14 @@ TEST(PictRead, Kinds) {
 // Two pieces side by side: each is drawn where it belongs, stretched to its place.
 TEST(PictRead, PiecesShareTheFrame) {
   const auto piece = [](const char* columns, const char* pixel) {
-    return std::string(" 009A 000000FF 8004 0000 0000 0001 0001 0000 0001 00000000 00480000 00480000 0010 0020 0003 0008 00000000 00000000"
-                       " 00000000 0000 0000 0001 0001 ") + "0000 " + std::string(columns, 4) + " 0001 " + (columns + 5) + " 0000 00" + pixel;
+    return std::string(
+               " 009A 000000FF 8004 0000 0000 0001 0001 0000 0001 00000000 00480000 00480000 0010 "
+               "0020 0003 0008 00000000 00000000"
+               " 00000000 0000 0000 0001 0001 ") +
+           "0000 " + std::string(columns, 4) + " 0001 " + (columns + 5) + " 0000 00" + pixel;
   };
-  const std::string file = kHead + piece("0000 0001", "010203") + piece("0001 0002", "040506") + " 00FF";
+  const std::string file =
+      kHead + piece("0000 0001", "010203") + piece("0001 0002", "040506") + " 00FF";
   const Decoded decoded = Decode(PictRead, Hex(file.c_str()));
   EXPECT_EQ(decoded.status, Status::Ok);
   EXPECT_EQ(PixelText(decoded.picture->image), "010203 040506");

@@ -10,24 +10,28 @@ namespace {
 // The filters as the format defines them, byte by byte.
 uint8_t Predicted(PngFilter filter, int left, int above, int corner) {
   const int estimate = left + above - corner;
-  const int distances[] = {std::abs(estimate - left), std::abs(estimate - above), std::abs(estimate - corner)};
+  const int distances[] = {std::abs(estimate - left), std::abs(estimate - above),
+                           std::abs(estimate - corner)};
   switch (filter) {
     case PngFilter::None: return 0;
     case PngFilter::Sub: return static_cast<uint8_t>(left);
     case PngFilter::Up: return static_cast<uint8_t>(above);
     case PngFilter::Average: return static_cast<uint8_t>((left + above) / 2);
     case PngFilter::Paeth:
-      if (distances[0] <= distances[1] && distances[0] <= distances[2]) return static_cast<uint8_t>(left);
+      if (distances[0] <= distances[1] && distances[0] <= distances[2])
+        return static_cast<uint8_t>(left);
       return static_cast<uint8_t>(distances[1] <= distances[2] ? above : corner);
   }
   return 0;
 }
 
-std::vector<uint8_t> Filtered(PngFilter filter, const std::vector<uint8_t>& row, const std::vector<uint8_t>& above, size_t step) {
+std::vector<uint8_t> Filtered(PngFilter filter, const std::vector<uint8_t>& row,
+                              const std::vector<uint8_t>& above, size_t step) {
   std::vector<uint8_t> result;
   for (size_t i = 0; i < row.size(); ++i) {
     const bool first = i < step;
-    const uint8_t predicted = Predicted(filter, first ? 0 : row[i - step], above[i], first ? 0 : above[i - step]);
+    const uint8_t predicted =
+        Predicted(filter, first ? 0 : row[i - step], above[i], first ? 0 : above[i - step]);
     result.push_back(static_cast<uint8_t>(row[i] - predicted));
   }
   return result;

@@ -31,14 +31,16 @@ TEST(Png, MetadataTravels) {
   EXPECT_TRUE(without.picture->metadata.Empty());
 }
 
-// Bands are deflated apart: their streams must be joined without a gap, and the checks over all of them be right.
+// Bands are deflated apart: their streams must be joined without a gap, and the checks over all of
+// them be right.
 TEST(Png, BandsBecomeOneStream) {
   const ScopedSettings scoped;
   const TemporaryFolder folder;
   struct Row {
     int32_t level, width, height;
   };
-  for (const Row& row : {Row{0, 3500, 3600}, Row{1, 1600, 900}, Row{9, 1600, 900}}) {  // nine bands, and twice two
+  // nine bands, and twice two
+  for (const Row& row : {Row{0, 3500, 3600}, Row{1, 1600, 900}, Row{9, 1600, 900}}) {
     SCOPED_TRACE(row.level);
     settings.PngCompression = row.level;
     const PicturePointer picture = PatternPicture(row.width, row.height, 24);
@@ -60,9 +62,11 @@ TEST(Png, BandsBecomeOneStream) {
 // The first row of a band differs from the row above, which belongs to the band before.
 TEST(Png, RowsAreFilteredAcrossTheEndsOfBands) {
   const PicturePointer picture = PatternPicture(1600, 900, 24);  // two bands
-  // Every pixel is half of its left one, so that Average serves best under a row of zeros, which is not there.
+  // Every pixel is half of its left one, so that Average serves best under a row of zeros, which is
+  // not there.
   for (int32_t y = 0; y < 900; ++y) {
-    for (size_t i = 0; i < 4800; ++i) picture->image.Row(y)[i] = static_cast<uint8_t>((128 >> i / 3 % 8) + y % 4);
+    for (size_t i = 0; i < 4800; ++i)
+      picture->image.Row(y)[i] = static_cast<uint8_t>((128 >> i / 3 % 8) + y % 4);
   }
   const std::vector<uint8_t> file = Encode(PngWrite, *picture);
   const Decoded back = Decode(PngRead, file);
@@ -82,7 +86,8 @@ TEST(Png, RowsAreFilteredAcrossTheEndsOfBands) {
 TEST(Png, AlphaOfPalettePicturesIsKept) {
   const PicturePointer picture = PatternPicture(33, 7, 4);
   ASSERT_EQ(NewAlphaPlane(33, 7, picture->alpha), Status::Ok);
-  for (int32_t x = 0; x < 33; ++x) picture->alpha.Row(3)[static_cast<size_t>(x)] = static_cast<uint8_t>(7 * x);
+  for (int32_t x = 0; x < 33; ++x)
+    picture->alpha.Row(3)[static_cast<size_t>(x)] = static_cast<uint8_t>(7 * x);
   const Decoded back = Decode(PngRead, Encode(PngWrite, *picture));
   ASSERT_EQ(back.status, Status::Ok);
   EXPECT_TRUE(SamePixels(back.picture->alpha, picture->alpha));
@@ -96,7 +101,8 @@ TEST(Png, BrokenFilesFailWithTheirStatus) {
   flipped[file.size() / 2] ^= 0x55;
   EXPECT_EQ(Decode(PngRead, flipped).status, Status::DamagedFile);
   EXPECT_EQ(Decode(PngRead, std::span(file).first(file.size() / 2)).status, Status::FileReadError);
-  std::vector<uint8_t> huge = file;  // sizes that no memory holds, and a CRC that no longer fits: refused either way
+  // sizes that no memory holds, and a CRC that no longer fits: refused either way
+  std::vector<uint8_t> huge = file;
   for (size_t i = 16; i < 24; ++i) huge[i] = 0x7f;
   EXPECT_NE(Decode(PngRead, huge).status, Status::Ok);
   std::vector<uint8_t> claims = file;  // a text of 640 MB in a small file

@@ -44,7 +44,8 @@ Picture Bars(int32_t width, int32_t height) {
   for (int32_t y = 0; y < height; ++y) {
     for (int32_t x = 0; x < width; ++x) {
       if ((x + y * y % 11) / (70 + 900 * (y % 3)) % 2 == 0) continue;
-      picture.rows[static_cast<size_t>(y) * RowBytes(picture) + static_cast<size_t>(x / 8)] |= static_cast<uint8_t>(0x80 >> x % 8);
+      picture.rows[static_cast<size_t>(y) * RowBytes(picture) + static_cast<size_t>(x / 8)] |=
+          static_cast<uint8_t>(0x80 >> x % 8);
     }
   }
   return picture;
@@ -52,7 +53,12 @@ Picture Bars(int32_t width, int32_t height) {
 
 std::vector<Picture> Pictures() {
   Picture white{"white", 100, 3, Bytes(39)}, black{"black", 64, 3, Bytes(24, 0xff)};
-  return {white, black, Noise("one pixel", 1, 9, 0), Noise("noise", 203, 40, 0), Noise("few dots", 3001, 30, 4), Bars(7000, 24)};
+  return {white,
+          black,
+          Noise("one pixel", 1, 9, 0),
+          Noise("noise", 203, 40, 0),
+          Noise("few dots", 3001, 30, 4),
+          Bars(7000, 24)};
 }
 
 Bytes Encoded(const Picture& picture) {

@@ -18,7 +18,8 @@ Bytes Decoded(const Bytes& coded, size_t size) {
 
 TEST(TiffLzw, CodesAsDefined) {
   // The example of the format's document: clear, 7, 258, 8, 8, 258, 6, 6, end, of 9 bits each.
-  const Bytes plain = Hex("07 07 07 08 08 07 07 06 06"), coded = Hex("80 01 E0 40 80 44 08 0C 06 80 80");
+  const Bytes plain = Hex("07 07 07 08 08 07 07 06 06"),
+              coded = Hex("80 01 E0 40 80 44 08 0C 06 80 80");
   Bytes made;
   TiffLzwEncoder encoder;
   encoder.Encode(plain, made);
@@ -29,7 +30,8 @@ TEST(TiffLzw, CodesAsDefined) {
 TEST(TiffLzw, EverythingComesBack) {
   TiffLzwEncoder encoder;
   Bytes coded;
-  for (const size_t size : {1, 2, 3, 255, 511, 3838, 3839, 3840, 10000, 70000}) {  // around the ends of tables and widths
+  // around the ends of tables and widths
+  for (const size_t size : {1, 2, 3, 255, 511, 3838, 3839, 3840, 10000, 70000}) {
     Bytes noise = RandomBytes(size, 5), few = noise, same(size, 9), runs = noise;
     for (size_t i = 0; i < size; ++i) {
       few[i] &= 3;
@@ -39,8 +41,10 @@ TEST(TiffLzw, EverythingComesBack) {
       SCOPED_TRACE(size);
       encoder.Encode(plain, coded);
       EXPECT_EQ(Decoded(coded, size), plain);
-      for (const size_t cut : {size_t{1}, coded.size() / 2, coded.size() - 3}) {  // the end code may be missing
-        const Bytes part(coded.begin(), coded.begin() + static_cast<ptrdiff_t>(std::min(cut, coded.size() - 3)));
+      // the end code may be missing
+      for (const size_t cut : {size_t{1}, coded.size() / 2, coded.size() - 3}) {
+        const Bytes part(coded.begin(),
+                         coded.begin() + static_cast<ptrdiff_t>(std::min(cut, coded.size() - 3)));
         if (coded.size() > 8) {
           EXPECT_EQ(Decoded(part, size), Bytes());
         }

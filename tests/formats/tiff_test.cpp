@@ -15,10 +15,12 @@
 namespace fotomill::test {
 namespace {
 
-// A little-endian page of one uncompressed strip: its entries, 12 bytes each, then what they point to and the pixels.
+// A little-endian page of one uncompressed strip: its entries, 12 bytes each, then what they point
+// to and the pixels.
 constexpr size_t kPageEnd = 8 + 2 + 8 * 12 + 4;
-std::vector<uint8_t> Page(uint32_t width, uint32_t height, uint16_t bits, uint16_t photometric, uint16_t samples,
-                          uint16_t lastTag, uint32_t lastValue, const std::vector<uint8_t>& pixels) {
+std::vector<uint8_t> Page(uint32_t width, uint32_t height, uint16_t bits, uint16_t photometric,
+                          uint16_t samples, uint16_t lastTag, uint32_t lastValue,
+                          const std::vector<uint8_t>& pixels) {
   std::vector<uint8_t> file = Hex("49 49 2A 00  08 00 00 00  08 00");
   const auto put = [&file](uint32_t value, int count) {
     for (int i = 0; i < count; ++i) file.push_back(static_cast<uint8_t>(value >> 8 * i));
@@ -72,7 +74,8 @@ TEST(Tiff, SamplesBecomePixels) {
   // clang-format on
   for (const Row& row : rows) {
     SCOPED_TRACE(row.name);
-    const auto file = Page(row.width, 1, row.bits, row.photometric, row.samples, row.lastTag, row.lastValue, Hex(row.pixels));
+    const auto file = Page(row.width, 1, row.bits, row.photometric, row.samples, row.lastTag,
+                           row.lastValue, Hex(row.pixels));
     const Decoded decoded = Decode(TiffRead, file);
     ASSERT_EQ(decoded.status, Status::Ok);
     EXPECT_EQ(PixelText(decoded.picture->image), row.expected);
@@ -119,8 +122,10 @@ TEST(Tiff, BrokenFilesFailWithTheirStatus) {
   std::vector<uint8_t> cut = Page(8, 8, 8, 1, 1, 339, 1, pixels), foreign = cut, loop = cut;
   cut.pop_back();
   foreign[2] = 41;
-  loop[kPageEnd - 4] = 8;                                                         // the next page is the same one
-  std::vector<uint8_t> bomb = Page(4000000, 1, 8, 1, 60000, 259, 32773, pixels);  // a row of 240 GB, run-length coded
+  // the next page is the same one
+  loop[kPageEnd - 4] = 8;
+  // a row of 240 GB, run-length coded
+  std::vector<uint8_t> bomb = Page(4000000, 1, 8, 1, 60000, 259, 32773, pixels);
   const Row rows[] = {
       {"last pixel missing", cut, Status::FileReadError},
       {"another magic number", foreign, Status::DamagedFile},
@@ -143,7 +148,8 @@ TEST(Tiff, FilesCutShortEndCleanly) {
   for (size_t length = 0; length < bare.size(); ++length) {
     EXPECT_NE(Decode(TiffRead, std::span(bare).first(length)).status, Status::Ok) << length;
   }
-  for (size_t length = 0; length < packed.size(); ++length) {  // its directory is last: the end may be a text's
+  // its directory is last: the end may be a text's
+  for (size_t length = 0; length < packed.size(); ++length) {
     const Decoded decoded = Decode(TiffRead, std::span(packed).first(length));
     EXPECT_EQ(decoded.picture->image.Empty(), decoded.status != Status::Ok) << length;
   }
@@ -157,7 +163,8 @@ TEST(Tiff, MetadataTravels) {
   picture->metadata.dpiX = 300;
   picture->metadata.dpiY = 150;
   picture->comment = {'h', 'i'};
-  picture->metadata.exif = Hex("4D4D 002A 00000008  0001  0112 0003 00000001 0006 0000  00000000");  // orientation 6
+  // orientation 6
+  picture->metadata.exif = Hex("4D4D 002A 00000008  0001  0112 0003 00000001 0006 0000  00000000");
   const Decoded back = Decode(TiffRead, Encode(TiffWrite, *picture));
   ASSERT_EQ(back.status, Status::Ok);
   EXPECT_EQ(back.picture->metadata.icc, picture->metadata.icc);
@@ -204,7 +211,8 @@ TEST(Tiff, OthersReadWhatIsWritten) {
     const PnmPicture seen = ReadPnm(folder.Path("a.pbm"));
     ASSERT_EQ(seen.values.size(), 7000u);
     for (size_t i = 0; i < seen.values.size(); ++i) {
-      const int32_t black = 1 - picture->image.PixelAt(static_cast<int32_t>(i % 100), static_cast<int32_t>(i / 100));
+      const int32_t black =
+          1 - picture->image.PixelAt(static_cast<int32_t>(i % 100), static_cast<int32_t>(i / 100));
       ASSERT_EQ(seen.values[i], black) << i;
     }
   }

@@ -17,7 +17,8 @@ PicturePointer TransparentPicture() {
   PicturePointer picture = PatternPicture(33, 7, 24);
   EXPECT_EQ(NewAlphaPlane(33, 7, picture->alpha), Status::Ok);
   for (int32_t y = 0; y < 7; ++y) {
-    for (int32_t x = 0; x < 33; ++x) picture->alpha.Row(y)[static_cast<size_t>(x)] = static_cast<uint8_t>(x * 8 + y);
+    for (int32_t x = 0; x < 33; ++x)
+      picture->alpha.Row(y)[static_cast<size_t>(x)] = static_cast<uint8_t>(x * 8 + y);
   }
   return picture;
 }
@@ -59,7 +60,8 @@ TEST(Webp, MetadataTravels) {
 }
 
 TEST(Webp, FramesAreDrawnOverEachOther) {
-  const std::vector<uint8_t> replacing = ReadBytes(SourcePath("tests/formats/webp/good/frames.webp"));
+  const std::vector<uint8_t> replacing =
+      ReadBytes(SourcePath("tests/formats/webp/good/frames.webp"));
   std::vector<uint8_t> blending = replacing;
   constexpr std::string_view kFrame = "ANMF";
   for (auto at = blending.begin(); at != blending.end();) {
@@ -90,7 +92,8 @@ TEST(Webp, FramesAreDrawnOverEachOther) {
     const auto at = [&](int32_t x) {
       char text[24];
       const int32_t alpha = picture->alpha.PixelAt(x, 5);
-      std::snprintf(text, sizeof text, "%d %06x", alpha, alpha == 0 ? 0 : picture->image.PixelAt(x, 5));
+      std::snprintf(text, sizeof text, "%d %06x", alpha,
+                    alpha == 0 ? 0 : picture->image.PixelAt(x, 5));
       return std::string(text);
     };
     EXPECT_EQ(at(3), row.left);

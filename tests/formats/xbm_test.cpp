@@ -86,7 +86,8 @@ TEST(Xbm, WritesText) {
 }
 
 TEST(Xbm, ReadsText) {
-  const std::string size8 = "#define a_width 8\n#define a_height 1\n", size16 = "#define a_width 16\n#define a_height 1\n";
+  const std::string size8 = "#define a_width 8\n#define a_height 1\n",
+                    size16 = "#define a_width 16\n#define a_height 1\n";
   const std::string bits = "static char a_bits[] = {\n";
   const std::string pad(300, ' ');
   const struct {
@@ -183,8 +184,8 @@ TEST(Xbm, RefusesSizes) {
   EXPECT_EQ(folder.Names(), std::vector<std::string>{"size.xbm"});
 }
 
-// Texts of 20 MB in which every search starts anew take no longer than one pass, and one that holds a value now and
-// then is read to its end, while one without any is given up.
+// Texts of 20 MB in which every search starts anew take no longer than one pass, and one that holds
+// a value now and then is read to its end, while one without any is given up.
 TEST(Xbm, ReadsLongTextsInOnePass) {
   const TemporaryFolder folder;
   const std::string path = folder.Path("long.xbm");
@@ -208,16 +209,19 @@ TEST(Xbm, ReadsLongTextsInOnePass) {
   }
 }
 
-// Where the width is no multiple of 8, others have the padding of a row behind it, and we in front of it, which is on
-// purpose: what they read of ours lies to the right by as many pixels, what we read of theirs to the left.
+// Where the width is no multiple of 8, others have the padding of a row behind it, and we in front
+// of it, which is on purpose: what they read of ours lies to the right by as many pixels, what we
+// read of theirs to the left.
 TEST(Xbm, AgreesWithNetpbmAtWholeBytes) {
   if (!HasProgram("xbmtopbm") || !HasProgram("pbmtoxbm")) GTEST_SKIP() << "netpbm is not installed";
   const TemporaryFolder folder;
-  const std::string ours = folder.Path("ours.xbm"), theirs = folder.Path("theirs.xbm"), seen = folder.Path("seen.pbm");
+  const std::string ours = folder.Path("ours.xbm"), theirs = folder.Path("theirs.xbm"),
+                    seen = folder.Path("seen.pbm");
   for (const int32_t width : {8, 10, 64, 67}) {
     SCOPED_TRACE(width);
     const int32_t moved = (8 - width % 8) % 8;
-    const PicturePointer picture = MakePicture(width, 5, 1, std::vector<Bytes>(5, RandomBytes(9, uint32_t(width))));
+    const PicturePointer picture =
+        MakePicture(width, 5, 1, std::vector<Bytes>(5, RandomBytes(9, uint32_t(width))));
     ASSERT_TRUE(picture->fileName.Assign(ours));
     ASSERT_EQ(XbmWrite(*picture, {}), Status::Ok);
     ASSERT_TRUE(RunShell("xbmtopbm " + ours + " > " + seen));
@@ -231,7 +235,8 @@ TEST(Xbm, AgreesWithNetpbmAtWholeBytes) {
     const PicturePointer again = NewPictureRecord();
     ASSERT_EQ(ReadFile(theirs, *again), Status::Ok);
     for (int32_t x = 0; x < width; ++x) {
-      const int32_t white = x + moved < width ? 1 - pnm.values[static_cast<size_t>(2 * width + x + moved)] : 1;
+      const int32_t white =
+          x + moved < width ? 1 - pnm.values[static_cast<size_t>(2 * width + x + moved)] : 1;
       ASSERT_EQ(again->image.PixelAt(x, 2), white) << x;
     }
   }
@@ -239,14 +244,17 @@ TEST(Xbm, AgreesWithNetpbmAtWholeBytes) {
 
 TEST(Xbm, ReadsTheBitmapsOfXAsNetpbmDoes) {
   const char* const bitmaps = "/usr/include/X11/bitmaps";
-  if (!HasProgram("xbmtopbm") || !std::filesystem::is_directory(bitmaps)) GTEST_SKIP() << "netpbm or xbitmaps is missing";
+  if (!HasProgram("xbmtopbm") || !std::filesystem::is_directory(bitmaps))
+    GTEST_SKIP() << "netpbm or xbitmaps is missing";
   const TemporaryFolder folder;
   const std::string seen = folder.Path("seen.pbm");
   int compared = 0;
   for (const auto& entry : std::filesystem::directory_iterator(bitmaps)) {
     SCOPED_TRACE(entry.path());
     const PicturePointer picture = NewPictureRecord();
-    if (XbmInfo(*picture, {.fileName = entry.path().string()}) != Status::Ok || picture->width % 8 != 0) continue;
+    if (XbmInfo(*picture, {.fileName = entry.path().string()}) != Status::Ok ||
+        picture->width % 8 != 0)
+      continue;
     if (!RunShell("xbmtopbm " + entry.path().string() + " > " + seen)) continue;
     ASSERT_EQ(XbmRead(*picture, {.fileName = entry.path().string()}), Status::Ok);
     const PnmPicture pnm = ReadPnm(seen);

@@ -51,7 +51,8 @@ std::string InOurForm(const std::string& type, const std::string& value) {
 }
 
 TEST(ExifCameras, ValuesAgreeWithAnotherReader) {
-  if (CorpusFolder().empty() || !HasProgram("exiv2")) GTEST_SKIP() << "needs real pictures and exiv2";
+  if (CorpusFolder().empty() || !HasProgram("exiv2"))
+    GTEST_SKIP() << "needs real pictures and exiv2";
   static const std::map<std::string, std::string> kDirectories = {
       {"Image", "IFD 0"}, {"Thumbnail", "IFD 1"}, {"Photo", "EXIF"}, {"GPSInfo", "GPS"}};
   const TemporaryFolder folder;
@@ -67,7 +68,8 @@ TEST(ExifCameras, ValuesAgreeWithAnotherReader) {
     for (std::string line; std::getline(lines, line);) {
       constexpr size_t kText = 31;  // the column behind tag, group and type
       std::string number, group, type, text = line.substr(std::min(kText, line.size()));
-      if (!(std::istringstream(line) >> number >> group >> type) || !kDirectories.contains(group)) continue;
+      if (!(std::istringstream(line) >> number >> group >> type) || !kDirectories.contains(group))
+        continue;
       const ExifTag row = CopyExifTag(static_cast<uint16_t>(std::stoul(number, nullptr, 16)));
       if (row.rule != ExifRule::Plain || row.editClass == kExifOpaque) continue;
       const std::string ourText = ours.texts[{kDirectories.at(group), row.tag}];

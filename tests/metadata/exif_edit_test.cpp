@@ -64,8 +64,9 @@ TEST(ExifEdit, SetsFactsInPlace) {
   blocks.Directory({{0xa002, 3, 1, 10}, {0xa003, 5, 1, 0x100}});
   SetExifPictureFacts(blocks.block, {70000, 300, 0});
   EXPECT_THAT(LinesOf(blocks.block),
-              ElementsAre("DIRECTORY IFD 0", "Image width=70000", "Image height=300", "Orientation of image=Right Top",
-                          "Exif tag=62", "DIRECTORY EXIF", "Valid image width=70000", "Valid image height=300"));
+              ElementsAre("DIRECTORY IFD 0", "Image width=70000", "Image height=300",
+                          "Orientation of image=Right Top", "Exif tag=62", "DIRECTORY EXIF",
+                          "Valid image width=70000", "Valid image height=300"));
 }
 
 TEST(ExifEdit, DropsTheThumbnail) {
@@ -74,7 +75,8 @@ TEST(ExifEdit, DropsTheThumbnail) {
     DropExifThumbnail(block);
     lines.erase(lines.begin() + 6, lines.begin() + 10);  // the second directory, and nothing else
     EXPECT_EQ(LinesOf(block), lines);
-    for (size_t i = 0x50; i < 0x7e; ++i) EXPECT_EQ(block[i], 0) << "nothing of it stays behind, offset " << i;
+    for (size_t i = 0x50; i < 0x7e; ++i)
+      EXPECT_EQ(block[i], 0) << "nothing of it stays behind, offset " << i;
     const Bytes once = block;
     DropExifThumbnail(block);
     EXPECT_EQ(block, once);
@@ -124,9 +126,11 @@ TEST(ExifEdit, ReplacesTheThumbnail) {
 }
 
 TEST(ExifEdit, LeavesAloneWhatIsNoBlock) {
-  for (const char* hex : {"", "4949", "4949 2B00 08000000 0100 0001 0300 01000000 05000000 00000000", "4949 2A00 00000000",
-                          "4949 2A00 08000000", "4949 2A00 08000000 0000 00000000", "4949 2A00 FEFFFFFF 0100",
-                          "4949 2A00 04000000 0100 0001 0300 01000000 05000000 00000000"}) {
+  for (const char* hex :
+       {"", "4949", "4949 2B00 08000000 0100 0001 0300 01000000 05000000 00000000",
+        "4949 2A00 00000000", "4949 2A00 08000000", "4949 2A00 08000000 0000 00000000",
+        "4949 2A00 FEFFFFFF 0100",
+        "4949 2A00 04000000 0100 0001 0300 01000000 05000000 00000000"}) {
     SCOPED_TRACE(hex);
     Bytes block = Hex(hex);
     SetExifPictureFacts(block, {1, 1, 1});

@@ -22,7 +22,9 @@ Bytes operator+(Bytes left, const Bytes& right) {
 Bytes Of(std::string_view text) { return {text.begin(), text.end()}; }
 Bytes Size16(size_t size) { return {static_cast<uint8_t>(size >> 8), static_cast<uint8_t>(size)}; }
 
-Bytes Segment(uint8_t marker, const Bytes& contents) { return Bytes{0xff, marker} + Size16(contents.size() + 2) + contents; }
+Bytes Segment(uint8_t marker, const Bytes& contents) {
+  return Bytes{0xff, marker} + Size16(contents.size() + 2) + contents;
+}
 Bytes PngChunk(std::string_view type, const Bytes& contents) {
   return Bytes(2) + Size16(contents.size()) + Of(type) + contents + Bytes(4);
 }

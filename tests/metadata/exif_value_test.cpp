@@ -13,8 +13,8 @@
 namespace fotomill::test {
 namespace {
 
-constexpr uint16_t B = kExifByte, A = kExifAscii, S = kExifShort, L = kExifLong, R = kExifRational, U = kExifUndefined,
-                   Q = kExifSRational;
+constexpr uint16_t B = kExifByte, A = kExifAscii, S = kExifShort, L = kExifLong, R = kExifRational,
+                   U = kExifUndefined, Q = kExifSRational;
 constexpr const char* kNoLine = nullptr;
 
 struct ValueCase {
@@ -81,8 +81,10 @@ TEST(ExifValue, TurnsValuesIntoText) {
 TEST(ExifValue, RoundsRationalsAsPrintfDoes) {
   std::mt19937 random(1);
   std::string buffer;
-  std::vector<std::pair<uint32_t, uint32_t>> rationals = {{15, 10000}, {4294967295, 2000}, {4294967295, 4294967294}};
-  for (int i = 0; i < 20000; ++i) rationals.emplace_back(random() >> random() % 32, random() >> random() % 32 | 1);
+  std::vector<std::pair<uint32_t, uint32_t>> rationals = {
+      {15, 10000}, {4294967295, 2000}, {4294967295, 4294967294}};
+  for (int i = 0; i < 20000; ++i)
+    rationals.emplace_back(random() >> random() % 32, random() >> random() % 32 | 1);
   for (const uint32_t odd : {1u, 3u, 77777u}) {
     for (uint32_t half = 16; half <= 2000000; half *= 5) rationals.emplace_back(odd, half);
   }
@@ -98,7 +100,8 @@ TEST(ExifValue, RoundsRationalsAsPrintfDoes) {
 }
 
 TEST(ExifValue, ReadsAShortThatClaimsNoValues) {
-  const auto bytes = Hex("0112 0003 00000000 0001 0006");  // one value, in the low half of the field
+  // one value, in the low half of the field
+  const auto bytes = Hex("0112 0003 00000000 0001 0006");
   const ExifBytes numbers(bytes, true);
   std::string buffer;
   EXPECT_EQ(ExifValueText(ReadExifValue(bytes, numbers, ReadExifField(numbers, 0)), nullptr, buffer), "6");
@@ -136,7 +139,8 @@ TEST(ExifValue, DecodesUserComments) {
 TEST(ExifValue, NormalisesRawCopies) {
   const struct {
     uint16_t type;
-    const char *bytes, *normalised;  // big-endian, as in the file; little-endian, as the editor wants them
+    // big-endian, as in the file; little-endian, as the editor wants them
+    const char *bytes, *normalised;
   } rows[] = {
       {S, "0102 0304 0506", "02010000 04030000 06050000"},  // a slot of 32 bits each
       {S, "0102 03", "02010000 00030000"},                  // the block ends within the second
@@ -162,7 +166,8 @@ TEST(ExifValue, NormalisesRawCopies) {
 }
 
 TEST(ExifTags, LookUpFunctionsKnowTagsAndOthers) {
-  for (size_t i = 0; i < ExifTags().size(); ++i) EXPECT_EQ(ExifTagIndex(ExifTags()[i].tag), static_cast<int32_t>(i));
+  for (size_t i = 0; i < ExifTags().size(); ++i)
+    EXPECT_EQ(ExifTagIndex(ExifTags()[i].tag), static_cast<int32_t>(i));
   EXPECT_EQ(ExifTagIndex(0xc4a5), kNoExifTag);
   EXPECT_EQ(ExifTagName(0xc4a5), "Unknown");
   EXPECT_EQ(CopyExifTag(0xc4a5).tag, 0xc4a5);

@@ -30,14 +30,15 @@ TEST(ExifWalk, FindsTheSameInBothByteOrders) {
     EXPECT_EQ(all.lines, LinesOf(LittleEndianBlock()));
     EXPECT_THAT(all.numbers, ElementsAre(0, 1, 2, 3));
     EXPECT_TRUE(WalkExif(block, &one, nullptr, 1));
-    EXPECT_THAT(one.lines,
-                ElementsAre("DIRECTORY IFD 1", "Compression scheme=JPEG", "Offset to JPEG SOI=122", "Bytes of JPEG data=4"));
+    EXPECT_THAT(one.lines, ElementsAre("DIRECTORY IFD 1", "Compression scheme=JPEG",
+                                       "Offset to JPEG SOI=122", "Bytes of JPEG data=4"));
     EXPECT_EQ(findings.exifOffset, 0x7eu);
     EXPECT_EQ(findings.gpsOffset, 0xb0u);
     EXPECT_THAT(ExifThumbnail(block, findings), ElementsAre(0xff, 0xd8, 0xff, 0xd9));
     EXPECT_THAT(ExifThumbnail(block, {0, 0, 0x7a, 0xce - 0x7a}), SizeIs(0xce - 0x7a));
-    for (const ExifFindings& none : {ExifFindings{0, 0, 0, 4}, ExifFindings{0, 0, 0x7a, 0xce - 0x7a + 1},
-                                     ExifFindings{0, 0, 0xffffffff, 1}, ExifFindings{0, 0, 8, 0xffffffff}}) {
+    for (const ExifFindings& none :
+         {ExifFindings{0, 0, 0, 4}, ExifFindings{0, 0, 0x7a, 0xce - 0x7a + 1},
+          ExifFindings{0, 0, 0xffffffff, 1}, ExifFindings{0, 0, 8, 0xffffffff}}) {
       EXPECT_TRUE(ExifThumbnail(block, none).empty()) << none.thumbnailOffset;
     }
     block[2] ^= 1;
@@ -51,7 +52,8 @@ constexpr uint16_t kWidth = 0x0100, kExif = 0x8769, kGps = 0x8825;
 // Directories one behind the other: the first at offset 8, of 6 bytes and 12 for each entry.
 struct Trap {
   const char* name;
-  std::vector<std::pair<std::vector<BlockBuilder::Entry>, uint32_t>> directories;  // entries, next directory
+  // entries, next directory
+  std::vector<std::pair<std::vector<BlockBuilder::Entry>, uint32_t>> directories;
   Lines lines;
 };
 
@@ -114,7 +116,8 @@ TEST(ExifWalk, KeepsToItsLimitsAndSaysSo) {
   // One long text that many entries share.
   BlockBuilder texts;
   const uint32_t text = texts.Bytes(std::vector<uint8_t>(10000, 'x'));
-  texts.Patch32(4, texts.Directory(std::vector<BlockBuilder::Entry>(60000, {0x010f, 2, 10000, text})));
+  texts.Patch32(4,
+                texts.Directory(std::vector<BlockBuilder::Entry>(60000, {0x010f, 2, 10000, text})));
   const Lines lines = LinesOf(texts.block, true);
   uint64_t size = 0;
   for (const std::string& line : lines) size += line.size();

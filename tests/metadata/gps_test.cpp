@@ -15,8 +15,9 @@ TEST(Gps, ReadsLocations) {
   ASSERT_TRUE(ParseGpsLocation("33, 51,35.9,s,151,12,40,e", location));
   EXPECT_NEAR(GpsDegrees(location.latitude), -33.8599722, 1e-6);
   EXPECT_NEAR(GpsDegrees(location.longitude), 151.2111111, 1e-6);
-  for (const char* bad : {"", "45,19,48.000,N", "45;19;48;N;7;1;1;W", "45,19,48,,79,13,12,W,", "45,19,48,N,79,13,12,",
-                          "x,19,48,N,79,13,12,W", "45,19,nan,N,79,13,12,W", "9999999999,1,4,N,79,13,12,W"}) {
+  for (const char* bad :
+       {"", "45,19,48.000,N", "45;19;48;N;7;1;1;W", "45,19,48,,79,13,12,W,", "45,19,48,N,79,13,12,",
+        "x,19,48,N,79,13,12,W", "45,19,nan,N,79,13,12,W", "9999999999,1,4,N,79,13,12,W"}) {
     EXPECT_FALSE(ParseGpsLocation(bad, location)) << bad;
     EXPECT_EQ(location.latitude.degrees, 0);
   }

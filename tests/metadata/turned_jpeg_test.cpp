@@ -18,8 +18,9 @@ namespace fotomill::test {
 namespace {
 
 using Bytes = std::vector<uint8_t>;
-constexpr const char* kTransforms[] = {"-flip horizontal", "-rotate 180", "-flip vertical", "-transpose",
-                                       "-rotate 90",       "-transverse", "-rotate 270"};
+constexpr const char* kTransforms[] = {"-flip horizontal", "-rotate 180", "-flip vertical",
+                                       "-transpose",       "-rotate 90",  "-transverse",
+                                       "-rotate 270"};
 
 Bytes Turned(const Bytes& file, const JpegTurnRequest& request, JpegTurnResult& result) {
   Bytes made;
@@ -29,7 +30,8 @@ Bytes Turned(const Bytes& file, const JpegTurnRequest& request, JpegTurnResult& 
 
 bool LookAlike(const Bytes& a, const Bytes& b) {
   const Decoded one = Decode(JpegRead, a), other = Decode(JpegRead, b);
-  return one.status == Status::Ok && other.status == Status::Ok && SamePixels(one.picture->image, other.picture->image);
+  return one.status == Status::Ok && other.status == Status::Ok &&
+         SamePixels(one.picture->image, other.picture->image);
 }
 
 TEST(TurnedJpeg, PixelsAreThoseOfJpegtran) {
@@ -47,7 +49,8 @@ TEST(TurnedJpeg, PixelsAreThoseOfJpegtran) {
       WriteBytes(old, file);
       for (int32_t number = 2; number <= 8; ++number) {
         SCOPED_TRACE(testing::Message() << width << " x " << height << ", form " << form << ", " << kTransforms[number - 2]);
-        const std::string command = std::string("jpegtran ") + kTransforms[number - 2] + " -outfile " + theirs + " ";
+        const std::string command =
+            std::string("jpegtran ") + kTransforms[number - 2] + " -outfile " + theirs + " ";
         JpegTurnResult result;
         const auto orientation = static_cast<Orientation>(number);
         const Bytes ours = Turned(file, {.turn = orientation}, result);
@@ -72,7 +75,8 @@ TEST(TurnedJpeg, PixelsAreThoseOfJpegtran) {
   }
 }
 
-// A file of which everything has to be turned: EXIF with sizes, orientation 6 and a thumbnail, XMP, two resolutions.
+// A file of which everything has to be turned: EXIF with sizes, orientation 6 and a thumbnail, XMP,
+// two resolutions.
 Bytes FullFile(int32_t width, int32_t height, const PicturePointer& thumbnail) {
   const ScopedSettings scoped;
   settings.JpegStoreDPI = 1;
@@ -82,7 +86,8 @@ Bytes FullFile(int32_t width, int32_t height, const PicturePointer& thumbnail) {
       0101 0004 00000001 00000030    # height 48
       0112 0003 00000001 00060000 00000000)");
   EXPECT_TRUE(ReplaceExifThumbnail(picture->metadata.exif, Encode(JpegWrite, *thumbnail), 65527));
-  for (const char c : std::string_view("<x tiff:Orientation = '6'/><tiff:Orientation>6</tiff:Orientation>")) {
+  for (const char c :
+       std::string_view("<x tiff:Orientation = '6'/><tiff:Orientation>6</tiff:Orientation>")) {
     picture->metadata.xmp.push_back(static_cast<uint8_t>(c));
   }
   picture->metadata.icc.assign(70000, 7);
@@ -106,7 +111,8 @@ TEST(TurnedJpeg, WhatBelongsToAPictureTurnsWithIt) {
     JpegTurnResult result;
     const Bytes made = Turned(file, {.turn = row.turn}, result);
     ASSERT_EQ(result.method, JpegTurnMethod::Pixels);
-    const PicturePointer picture = Decode(JpegRead, made).picture, old = Decode(JpegRead, file).picture;
+    const PicturePointer picture = Decode(JpegRead, made).picture,
+                         old = Decode(JpegRead, file).picture;
     EXPECT_EQ(picture->width, row.width);
     EXPECT_EQ(ExifOrientation(picture->metadata.exif), 1);
     EXPECT_EQ(picture->metadata.exif[21], row.width);
@@ -122,7 +128,8 @@ TEST(TurnedJpeg, WhatBelongsToAPictureTurnsWithIt) {
     const Decoded thumbnail = Decode(JpegRead, ExifThumbnail(picture->metadata.exif, findings));
     ASSERT_EQ(thumbnail.status, Status::Ok);
     EXPECT_EQ(thumbnail.picture->width, SwapsSides(row.whole) ? 24 : row.thumbnailWidth);
-    // Seen as it is stored, it takes the turn alone; a turn that its orientation tells already changes nothing else.
+    // Seen as it is stored, it takes the turn alone; a turn that its orientation tells already
+    // changes nothing else.
     const Bytes raw = Turned(file, {.turn = Orientation::HalfTurn, .seenByExif = false}, result);
     EXPECT_EQ(Decode(JpegRead, raw).picture->width, 64);
     (void)Turned(file, {.turn = Orientation::QuarterLeft}, result);
@@ -141,8 +148,10 @@ TEST(TurnedJpeg, UnfitFilesKeepTheirPixels) {
   several.insert(several.begin() + 2, index.begin(), index.end());
   JpegHead head;
   ASSERT_EQ(ParseJpegHead(sound, head), Status::Ok);
-  const Bytes second = Hex("FFE1000A 457869660000 0102");  // goes on where the first EXIF segment ends
-  split.insert(split.begin() + static_cast<std::ptrdiff_t>(head.scan), second.begin(), second.end());
+  // goes on where the first EXIF segment ends
+  const Bytes second = Hex("FFE1000A 457869660000 0102");
+  split.insert(split.begin() + static_cast<std::ptrdiff_t>(head.scan), second.begin(),
+               second.end());
   for (const Bytes& file : {flawed, several, split}) {
     JpegTurnResult result;
     const Bytes made = Turned(file, {.turn = Orientation::HalfTurn}, result);
@@ -160,7 +169,8 @@ TEST(TurnedJpeg, UnfitFilesKeepTheirPixels) {
 }
 
 TEST(TurnedJpeg, AnOrientationIsAddedInTheOrderOfTheTags) {
-  const Bytes first = Hex("4D4D002A 00000008 0002  010F 0002 00000004 41424300  0132 0002 00000002 44000000  00000000");
+  const Bytes first = Hex(
+      "4D4D002A 00000008 0002  010F 0002 00000004 41424300  0132 0002 00000002 44000000  00000000");
   for (const Bytes& block : {Bytes(), first, Hex("49492A00 08000000 0000 00000000")}) {
     Bytes changed = block;
     ASSERT_TRUE(PutExifOrientation(changed, 6));
@@ -170,7 +180,8 @@ TEST(TurnedJpeg, AnOrientationIsAddedInTheOrderOfTheTags) {
   Bytes changed = first;
   ASSERT_TRUE(PutExifOrientation(changed, 6));
   EXPECT_EQ(Bytes(changed.begin() + static_cast<std::ptrdiff_t>(first.size()), changed.end()),
-            Hex("0003 010F 0002 00000004 41424300  0112 0003 00000001 00060000  0132 0002 00000002 44000000  00000000"));
+            Hex("0003 010F 0002 00000004 41424300  0112 0003 00000001 00060000  0132 0002 00000002 "
+                "44000000  00000000"));
   Bytes odd = {1, 2, 3};
   EXPECT_FALSE(PutExifOrientation(odd, 6));
 }

@@ -5,7 +5,8 @@
 #include "operations/engine.h"
 #include "processing/pictures.h"
 
-// Expected values are computed here from the formulas that docs/effects.md states, for a grid of colors.
+// Expected values are computed here from the formulas that docs/effects.md states, for a grid of
+// colors.
 namespace fotomill::test {
 namespace {
 
@@ -24,7 +25,8 @@ PicturePointer Grid() { return MakePicture(kSteps * kSteps, kSteps, GridColor); 
 
 Status Apply(const std::string& text, PictureRecord& picture) {
   Recipe recipe;
-  for (const Mistake& mistake : ReadRecipe(text, {}, recipe)) ADD_FAILURE() << text << ": " << mistake.Text();
+  for (const Mistake& mistake : ReadRecipe(text, {}, recipe))
+    ADD_FAILURE() << text << ": " << mistake.Text();
   return ApplySteps(picture, recipe.common, {});
 }
 
@@ -36,8 +38,11 @@ Formula Each(const std::function<double(double)>& value) {
 double Luma1000(const Rgb& c) { return 299 * c.red + 587 * c.green + 114 * c.blue; }
 Rgb Gray(double v) { return {v, v, v}; }
 
-// Rounded to nearest, ties up, then clamped. Sums that are ties on paper may be a hair below in binary.
-uint32_t Level(double v) { return static_cast<uint32_t>(std::clamp(std::floor(v + 0.5 + 1e-9), 0.0, 255.0)); }
+// Rounded to nearest, ties up, then clamped. Sums that are ties on paper may be a hair below in
+// binary.
+uint32_t Level(double v) {
+  return static_cast<uint32_t>(std::clamp(std::floor(v + 0.5 + 1e-9), 0.0, 255.0));
+}
 
 struct Row {
   const char* text;
@@ -48,13 +53,16 @@ TEST(Effects, FollowTheirFormulas) {
   const Row rows[] = {
       {"brightness 10", Each([](double v) { return v + 25.5; })},
       {"brightness -33", Each([](double v) { return v - 255 * 33 / 100.0; })},
-      {"contrast 30", Each([](double v) { return (v - 127.5) * std::tan(130 * M_PI / 400) + 127.5; })},
+      {"contrast 30",
+       Each([](double v) { return (v - 127.5) * std::tan(130 * M_PI / 400) + 127.5; })},
       {"contrast -100", Each([](double) { return 127.5; })},
       {"contrast 100", Each([](double v) { return v < 127.5 ? 0 : 255; })},
       {"gamma 2.2", Each([](double v) { return 255 * std::pow(v / 255, 1 / 2.2); })},
-      {"levels 20 220", Each([](double v) { return 255 * (std::clamp(v, 20.0, 220.0) - 20) / 200; })},
-      {"levels 20 220 2 out-black=200 out-white=50",
-       Each([](double v) { return 200 - 150 * std::sqrt((std::clamp(v, 20.0, 220.0) - 20) / 200); })},
+      {"levels 20 220",
+       Each([](double v) { return 255 * (std::clamp(v, 20.0, 220.0) - 20) / 200; })},
+      {"levels 20 220 2 out-black=200 out-white=50", Each([](double v) {
+         return 200 - 150 * std::sqrt((std::clamp(v, 20.0, 220.0) - 20) / 200);
+       })},
       {"curves \"0,0 255,255\"", Each([](double v) { return v; })},
       {"curves \"0,255 255,0\"", Each([](double v) { return 255 - v; })},
       {"curves \"30,10 60,70\" red",
@@ -65,7 +73,10 @@ TEST(Effects, FollowTheirFormulas) {
       {"posterize 4", Each([](double v) { return std::floor(v * 3 / 255 + 0.5) * 85; })},
       {"posterize 256", Each([](double v) { return v; })},
       {"solarize 120", Each([](double v) { return v >= 120 ? 255 - v : v; })},
-      {"temperature 40", [](const Rgb& c) { return Rgb{c.red * 1.1, c.green, c.blue * 0.9}; }},
+      {"temperature 40",
+       [](const Rgb& c) {
+         return Rgb{c.red * 1.1, c.green, c.blue * 0.9};
+       }},
       {"tint #ff8000 29%",
        [](const Rgb& c) {
          const auto mixed = [](double v, double to) { return v + (to - v) * 29 / 100; };
@@ -77,32 +88,50 @@ TEST(Effects, FollowTheirFormulas) {
       {"saturation 0", [](const Rgb& c) { return Gray(Luma1000(c) / 1000); }},
       {"saturation 150",
        [](const Rgb& c) {
-         const auto spread = [&](double v) { return (Luma1000(c) + (1000 * v - Luma1000(c)) * 1.5) / 1000; };
+         const auto spread = [&](double v) {
+           return (Luma1000(c) + (1000 * v - Luma1000(c)) * 1.5) / 1000;
+         };
          return Rgb{spread(c.red), spread(c.green), spread(c.blue)};
        }},
       {"saturation 400%",
        [](const Rgb& c) {
-         const auto spread = [&](double v) { return (Luma1000(c) + (1000 * v - Luma1000(c)) * 4) / 1000; };
+         const auto spread = [&](double v) {
+           return (Luma1000(c) + (1000 * v - Luma1000(c)) * 4) / 1000;
+         };
          return Rgb{spread(c.red), spread(c.green), spread(c.blue)};
        }},
       {"sepia",
        [](const Rgb& c) {
-         return Rgb{(393 * c.red + 769 * c.green + 189 * c.blue) / 1000, (349 * c.red + 686 * c.green + 168 * c.blue) / 1000,
+         return Rgb{(393 * c.red + 769 * c.green + 189 * c.blue) / 1000,
+                    (349 * c.red + 686 * c.green + 168 * c.blue) / 1000,
                     (272 * c.red + 534 * c.green + 131 * c.blue) / 1000};
        }},
       {"sepia 0", Each([](double v) { return v; })},
       {"colorize #4080c0",
        [](const Rgb& c) {
          const double v = std::floor(Luma1000(c) / 1000 + 0.5);
-         const auto shade = [v](double color) { return v <= 127.5 ? color * v / 127.5 : color + (255 - color) * (v - 127.5) / 127.5; };
+         const auto shade = [v](double color) {
+           return v <= 127.5 ? color * v / 127.5 : color + (255 - color) * (v - 127.5) / 127.5;
+         };
          return Rgb{shade(0x40), shade(0x80), shade(0xc0)};
        }},
       {"channels keep=green", [](const Rgb& c) { return Gray(c.green); }},
-      {"channels swap=red-blue", [](const Rgb& c) { return Rgb{c.blue, c.green, c.red}; }},
+      {"channels swap=red-blue",
+       [](const Rgb& c) {
+         return Rgb{c.blue, c.green, c.red};
+       }},
       {"channels mix=\"50 50 0, 0 100 0, -100 0 200\"",
-       [](const Rgb& c) { return Rgb{(c.red + c.green) / 2, c.green, 2 * c.blue - c.red}; }},
-      {"hue 120", [](const Rgb& c) { return Rgb{c.blue, c.red, c.green}; }},
-      {"hue -120", [](const Rgb& c) { return Rgb{c.green, c.blue, c.red}; }},
+       [](const Rgb& c) {
+         return Rgb{(c.red + c.green) / 2, c.green, 2 * c.blue - c.red};
+       }},
+      {"hue 120",
+       [](const Rgb& c) {
+         return Rgb{c.blue, c.red, c.green};
+       }},
+      {"hue -120",
+       [](const Rgb& c) {
+         return Rgb{c.green, c.blue, c.red};
+       }},
       {"hue 360", Each([](double v) { return v; })},
       {"hue 180",  // opposite: what is above the least channel is below the largest
        [](const Rgb& c) {
@@ -118,7 +147,9 @@ TEST(Effects, FollowTheirFormulas) {
     for (int32_t y = 0; y < kSteps && wrong < 5; ++y) {
       for (int32_t x = 0; x < kSteps * kSteps && wrong < 5; ++x) {
         const uint32_t old = GridColor(x, y);
-        const Rgb made = row.formula({static_cast<double>(old >> 16), static_cast<double>(old >> 8 & 255), static_cast<double>(old & 255)});
+        const Rgb made =
+            row.formula({static_cast<double>(old >> 16), static_cast<double>(old >> 8 & 255),
+                         static_cast<double>(old & 255)});
         const uint32_t expected = Level(made.red) << 16 | Level(made.green) << 8 | Level(made.blue);
         if (ColorAt(*picture, x, y) == expected) continue;
         ++wrong;
@@ -142,16 +173,19 @@ TEST(Effects, StretchLevelsAsTheirHistogramSays) {
   };
   for (const Case& row : cases) {
     SCOPED_TRACE(row.text);
-    const PicturePointer picture = MakePicture(static_cast<int32_t>(row.before.size()), 1, [&](int32_t x, int32_t) {
-      return static_cast<uint32_t>(row.before[static_cast<size_t>(x)]) * 0x010101u;
-    });
+    const PicturePointer picture =
+        MakePicture(static_cast<int32_t>(row.before.size()), 1, [&](int32_t x, int32_t) {
+          return static_cast<uint32_t>(row.before[static_cast<size_t>(x)]) * 0x010101u;
+        });
     ASSERT_EQ(Apply(row.text, *picture), Status::Ok);
     for (size_t x = 0; x < row.after.size(); ++x) {
       EXPECT_EQ(ColorAt(*picture, static_cast<int32_t>(x), 0) & 255, static_cast<uint32_t>(row.after[x])) << x;
     }
   }
   // One histogram for all channels keeps grays gray; three do not.
-  const auto makePair = [] { return MakePicture(2, 1, [](int32_t x, int32_t) { return x == 0 ? 0x204060u : 0x808080u; }); };
+  const auto makePair = [] {
+    return MakePicture(2, 1, [](int32_t x, int32_t) { return x == 0 ? 0x204060u : 0x808080u; });
+  };
   const PicturePointer together = makePair(), each = makePair();
   ASSERT_EQ(Apply("auto-levels 0 together", *together), Status::Ok);
   ASSERT_EQ(Apply("auto-levels 0", *each), Status::Ok);
@@ -186,13 +220,16 @@ TEST(Effects, VignetteDarkensCornersAndKeepsTheMiddle) {
   EXPECT_EQ(corner, ColorAt(*picture, 0, 60));
   EXPECT_NEAR(corner >> 16, 227, 2);  // half way to red, within what the half pixel to the corner leaves
   EXPECT_NEAR(corner & 255, 100, 2);
-  const double r = std::sqrt(std::pow(50 / 50.5, 2) / 2), s = (r - 0.4) / 0.6;  // the middle of the left edge
+  // the middle of the left edge
+  const double r = std::sqrt(std::pow(50 / 50.5, 2) / 2), s = (r - 0.4) / 0.6;
   EXPECT_EQ(ColorAt(*picture, 0, 30) & 255, static_cast<uint32_t>(200 - 100 * s * s * (3 - 2 * s) + 0.5));
 }
 
 TEST(Effects, RefuseWhatMakesNoSense) {
-  for (const char* text : {"levels 200 100", "tint #ff000080", "channels", "channels keep=red swap=red-blue", "channels mix=\"1 2\"",
-                           "channels mix=\"1 2 3 4 5 6 7 8 nan\"", "channels mix=\"1 2 3 4 5 6 7 8 201\"", "posterize 1", "saturation -1"}) {
+  for (const char* text :
+       {"levels 200 100", "tint #ff000080", "channels", "channels keep=red swap=red-blue",
+        "channels mix=\"1 2\"", "channels mix=\"1 2 3 4 5 6 7 8 nan\"",
+        "channels mix=\"1 2 3 4 5 6 7 8 201\"", "posterize 1", "saturation -1"}) {
     SCOPED_TRACE(text);
     Recipe recipe;
     EXPECT_EQ(ReadRecipe(text, {}, recipe).size(), 1u);

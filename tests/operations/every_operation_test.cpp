@@ -13,7 +13,8 @@ const EngineOptions kSerial;
 
 // Pictures of all kinds: every depth, one pixel, one row, one column, with alpha.
 PicturePointer TestPicture(int32_t width, int32_t height, int32_t bits, bool alpha) {
-  PicturePointer picture = MakePicture(width, height, [](int32_t x, int32_t y) { return Scatter(x / 3, y / 2) & 0xffffff; });
+  PicturePointer picture = MakePicture(
+      width, height, [](int32_t x, int32_t y) { return Scatter(x / 3, y / 2) & 0xffffff; });
   if (bits < 24) {
     Palette palette = GrayRamp();
     for (size_t i = 0; i < palette.size(); i += 3) palette[i] = static_cast<uint8_t>(255 - i / 4);
@@ -21,10 +22,13 @@ PicturePointer TestPicture(int32_t width, int32_t height, int32_t bits, bool alp
     picture->palette = palette;
     picture->bitsPerPixel = bits;
     for (int32_t y = 0; y < height; ++y) {
-      for (int32_t i = 0; i < (width * bits + 7) / 8; ++i) picture->image.Row(y)[static_cast<size_t>(i)] = static_cast<uint8_t>(Scatter(i, y));
+      for (int32_t i = 0; i < (width * bits + 7) / 8; ++i)
+        picture->image.Row(y)[static_cast<size_t>(i)] = static_cast<uint8_t>(Scatter(i, y));
     }
   }
-  if (alpha) AddAlpha(*picture, [](int32_t x, int32_t y) { return static_cast<int32_t>(Scatter(y, x) & 0xff); });
+  if (alpha)
+    AddAlpha(*picture,
+             [](int32_t x, int32_t y) { return static_cast<int32_t>(Scatter(y, x) & 0xff); });
   return picture;
 }
 
@@ -45,7 +49,8 @@ std::vector<uint8_t> Looks(const PictureRecord& picture) {
 
 Recipe Read(const std::string& text) {
   Recipe recipe;
-  for (const Mistake& mistake : ReadRecipe(text, {}, recipe)) ADD_FAILURE() << text << ": " << mistake.Text();
+  for (const Mistake& mistake : ReadRecipe(text, {}, recipe))
+    ADD_FAILURE() << text << ": " << mistake.Text();
   return recipe;
 }
 
@@ -58,7 +63,8 @@ void ExpectWhole(const PictureRecord& picture) {
   EXPECT_EQ(picture.alpha.Height(), picture.image.Height());
 }
 
-// A line with each number at its least or most, and everything else at its default; empty where that is a mistake.
+// A line with each number at its least or most, and everything else at its default; empty where
+// that is a mistake.
 std::string LineAt(const Operation& operation, bool most) {
   std::string line = operation.name;
   for (const Parameter& row : operation.parameters) {
@@ -94,7 +100,8 @@ TEST(EveryOperation, HasARowThatFaceAndEngineCanUse) {
 
 TEST(EveryOperation, WorksOnEveryKindOfPicture) {
   for (const Operation* operation : Operations()) {
-    for (const std::string& line : {std::string(operation->example), LineAt(*operation, false), LineAt(*operation, true)}) {
+    for (const std::string& line :
+         {std::string(operation->example), LineAt(*operation, false), LineAt(*operation, true)}) {
       SCOPED_TRACE(line);
       Recipe recipe;
       if (!ReadRecipe(line, {}, recipe).empty()) continue;  // a parameter must be given
@@ -104,7 +111,8 @@ TEST(EveryOperation, WorksOnEveryKindOfPicture) {
         for (const auto& [width, height] : {std::pair{1, 1}, {1, 9}, {40, 1}, {37, 23}}) {
           for (const bool alpha : {false, true}) {
             SCOPED_TRACE(std::to_string(width) + "x" + std::to_string(height) + ", bits " + std::to_string(bits));
-            const PicturePointer serial = TestPicture(width, height, bits, alpha), parallel = TestPicture(width, height, bits, alpha);
+            const PicturePointer serial = TestPicture(width, height, bits, alpha),
+                                 parallel = TestPicture(width, height, bits, alpha);
             const Status status = ApplySteps(*serial, recipe.common, kSerial);
             EXPECT_EQ(ApplySteps(*parallel, recipe.common, {.work = {.threads = 0}, .facts = {}}), status);
             if (status != Status::Ok) continue;
@@ -123,7 +131,8 @@ TEST(EveryOperation, GivesAPaletteWhatItGivesThePromotedPicture) {
     SCOPED_TRACE(operation->name);
     const Recipe recipe = Read(operation->example);
     for (const int32_t bits : {1, 4, 8}) {
-      const PicturePointer palette = TestPicture(37, 23, bits, false), promoted = TestPicture(37, 23, bits, false);
+      const PicturePointer palette = TestPicture(37, 23, bits, false),
+                           promoted = TestPicture(37, 23, bits, false);
       ASSERT_EQ(PromotePicture(*promoted), Status::Ok);
       ASSERT_EQ(ApplySteps(*palette, recipe.common, kSerial), Status::Ok);
       ASSERT_EQ(ApplySteps(*promoted, recipe.common, kSerial), Status::Ok);
@@ -134,15 +143,18 @@ TEST(EveryOperation, GivesAPaletteWhatItGivesThePromotedPicture) {
 }
 
 TEST(EveryOperation, ComputesAPartAsThatPartOfTheWhole) {
-  std::vector<std::string> texts{"gray; blur 5; contrast 20; sharpen 0.7", "flip; blur 9; unsharp 2 0.5 3"};
+  std::vector<std::string> texts{"gray; blur 5; contrast 20; sharpen 0.7",
+                                 "flip; blur 9; unsharp 2 0.5 3"};
   for (const Operation* operation : Operations()) texts.emplace_back(operation->example);
   for (const std::string& text : texts) {
     SCOPED_TRACE(text);
     const Recipe recipe = Read(text);
     for (const bool alpha : {false, true}) {
-      const PicturePointer whole = TestPicture(150, 90, 24, alpha), source = TestPicture(150, 90, 24, alpha);
+      const PicturePointer whole = TestPicture(150, 90, 24, alpha),
+                           source = TestPicture(150, 90, 24, alpha);
       ASSERT_EQ(ApplySteps(*whole, recipe.common, kSerial), Status::Ok);
-      for (const Rectangle& area : {Rectangle{0, 0, 9, 7}, {61, 33, 20, 15}, {140, 85, 30, 30}, {70, 40, 1, 1}}) {
+      for (const Rectangle& area :
+           {Rectangle{0, 0, 9, 7}, {61, 33, 20, 15}, {140, 85, 30, 30}, {70, 40, 1, 1}}) {
         PictureRecord part;
         const std::vector<Step> none;
         PictureRecord cut;
@@ -157,10 +169,12 @@ TEST(EveryOperation, ComputesAPartAsThatPartOfTheWhole) {
 }
 
 TEST(Engine, FusesPointOperationsWithoutChangingAByte) {
-  const PicturePointer fused = TestPicture(64, 40, 24, false), apart = TestPicture(64, 40, 24, false);
+  const PicturePointer fused = TestPicture(64, 40, 24, false),
+                       apart = TestPicture(64, 40, 24, false);
   const Recipe recipe = Read("brightness 12; gamma 1.7; gray; contrast -20; invert");
   ASSERT_EQ(ApplySteps(*fused, recipe.common, kSerial), Status::Ok);
-  for (const Step& step : recipe.common) ASSERT_EQ(ApplySteps(*apart, std::span(&step, 1), kSerial), Status::Ok);
+  for (const Step& step : recipe.common)
+    ASSERT_EQ(ApplySteps(*apart, std::span(&step, 1), kSerial), Status::Ok);
   EXPECT_EQ(Looks(*fused), Looks(*apart));
 }
 

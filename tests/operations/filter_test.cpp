@@ -16,12 +16,14 @@ constexpr int32_t kWidth = 31, kHeight = 19;
 
 Status Apply(PictureRecord& picture, const std::string& text) {
   Recipe recipe;
-  for (const Mistake& mistake : ReadRecipe(text, {}, recipe)) ADD_FAILURE() << text << ": " << mistake.Text();
+  for (const Mistake& mistake : ReadRecipe(text, {}, recipe))
+    ADD_FAILURE() << text << ": " << mistake.Text();
   return ApplySteps(picture, recipe.common, kSerial);
 }
 
 PicturePointer Source() {
-  return MakePicture(kWidth, kHeight, [](int32_t x, int32_t y) { return Scatter(x / 3, y / 2) & 0xffffff; });
+  return MakePicture(kWidth, kHeight,
+                     [](int32_t x, int32_t y) { return Scatter(x / 3, y / 2) & 0xffffff; });
 }
 
 // A channel of a picture whose edges repeat.
@@ -29,7 +31,9 @@ struct Channel {
   const PictureRecord& picture;
   int shift;
   int32_t operator()(int32_t x, int32_t y) const {
-    return static_cast<int32_t>(ColorAt(picture, std::clamp(x, 0, kWidth - 1), std::clamp(y, 0, kHeight - 1)) >> shift & 255);
+    return static_cast<int32_t>(
+        ColorAt(picture, std::clamp(x, 0, kWidth - 1), std::clamp(y, 0, kHeight - 1)) >> shift &
+        255);
   }
 };
 
@@ -39,7 +43,8 @@ double Slope(const Channel& at, int32_t x, int32_t y, bool across) {
   double sum = 0;
   for (int32_t i = -1; i <= 1; ++i) {
     const int32_t weight = i == 0 ? 2 : 1;
-    sum += across ? weight * (at(x + 1, y + i) - at(x - 1, y + i)) : weight * (at(x + i, y + 1) - at(x + i, y - 1));
+    sum += across ? weight * (at(x + 1, y + i) - at(x - 1, y + i))
+                  : weight * (at(x + i, y + 1) - at(x + i, y - 1));
   }
   return sum;
 }
@@ -87,7 +92,8 @@ TEST(Filters, ComputeTheirFormulas) {
        [](const Channel& at, int32_t x, int32_t y) {
          double sum = 0, count = 0;
          for (int32_t j = y / 4 * 4; j < std::min(y / 4 * 4 + 4, kHeight); ++j) {
-           for (int32_t i = x / 4 * 4; i < std::min(x / 4 * 4 + 4, kWidth); ++i, ++count) sum += at(i, j);
+           for (int32_t i = x / 4 * 4; i < std::min(x / 4 * 4 + 4, kWidth); ++i, ++count)
+             sum += at(i, j);
          }
          return sum / count;
        },
@@ -104,7 +110,8 @@ TEST(Filters, ComputeTheirFormulas) {
        [](const Channel& at, int32_t x, int32_t y) {
          double sum = 0, count = 0;
          for (int32_t i = 0; i < 25; ++i) {
-           const int32_t level = at(x + i % 5 - 2, y + i / 5 - 2), weight = std::max(0, 31 - std::abs(level - at(x, y)));
+           const int32_t level = at(x + i % 5 - 2, y + i / 5 - 2),
+                         weight = std::max(0, 31 - std::abs(level - at(x, y)));
            sum += weight * level;
            count += weight;
          }
@@ -141,7 +148,9 @@ TEST(Filters, OilTakesTheMostFrequentRange) {
       std::map<int32_t, Sum> ranges;
       for (int32_t i = 0; i < 25; ++i) {
         const int32_t u = x + i % 5 - 2, v = y + i / 5 - 2;
-        Sum& sum = ranges[static_cast<int32_t>(0.299 * red(u, v) + 0.587 * green(u, v) + 0.114 * blue(u, v) + 0.5) / 32];
+        Sum& sum = ranges[static_cast<int32_t>(0.299 * red(u, v) + 0.587 * green(u, v) +
+                                               0.114 * blue(u, v) + 0.5) /
+                          32];
         ++sum.count;
         sum.green += green(u, v);
       }
@@ -193,7 +202,9 @@ TEST(Filters, NoiseHasItsDistribution) {
 }
 
 TEST(Filters, RedEyesLoseTheirRedWithinTheAreaOnly) {
-  const auto make = [] { return MakePicture(6, 4, [](int32_t x, int32_t) { return x % 2 == 0 ? 0xd02030u : 0x806050u; }); };
+  const auto make = [] {
+    return MakePicture(6, 4, [](int32_t x, int32_t) { return x % 2 == 0 ? 0xd02030u : 0x806050u; });
+  };
   const PicturePointer picture = make();
   ASSERT_EQ(Apply(*picture, "red-eye 3x2+1+1"), Status::Ok);
   const PicturePointer source = make();
@@ -207,11 +218,13 @@ TEST(Filters, RedEyesLoseTheirRedWithinTheAreaOnly) {
 
 // The hidden colors of transparent pixels must not come out.
 TEST(Filters, ColorsCountByTheirAlpha) {
-  for (const char* line : {"motion-blur 5 20", "radial-blur zoom 60", "radial-blur spin 40", "surface-blur 3 255", "oil 2", "mosaic 7",
-                           "kernel '1 1 1 1 1 1 1 1 1'", "despeckle threshold=0", "rotate 20 background=#00000000", "swirl 90"}) {
+  for (const char* line : {"motion-blur 5 20", "radial-blur zoom 60", "radial-blur spin 40",
+                           "surface-blur 3 255", "oil 2", "mosaic 7", "kernel '1 1 1 1 1 1 1 1 1'",
+                           "despeckle threshold=0", "rotate 20 background=#00000000", "swirl 90"}) {
     SCOPED_TRACE(line);
     const auto isSeen = [](int32_t x) { return x < 10; };
-    const PicturePointer picture = MakePicture(20, 8, [&](int32_t x, int32_t) { return isSeen(x) ? 0x306090u : 0xffffffu; });
+    const PicturePointer picture =
+        MakePicture(20, 8, [&](int32_t x, int32_t) { return isSeen(x) ? 0x306090u : 0xffffffu; });
     AddAlpha(*picture, [&](int32_t x, int32_t) { return isSeen(x) ? 200 : 0; });
     ASSERT_EQ(Apply(*picture, line), Status::Ok);
     for (int32_t y = 0; y < picture->image.Height(); ++y) {
@@ -228,8 +241,11 @@ TEST(Filters, ColorsCountByTheirAlpha) {
 TEST(Filters, KernelsAreChecked) {
   const struct {
     const char *line, *parameter;
-  } rows[] = {{"kernel '1 2 3'", "weights"}, {"kernel '1 1 1 1 x 1 1 1 1'", "weights"}, {"kernel '1 1 1 1 nan 1 1 1 1'", "weights"},
-              {"kernel ''", "weights"},      {"kernel '1,1,1 1,1,1 1,1,1' divisor=0", "divisor"}};
+  } rows[] = {{"kernel '1 2 3'", "weights"},
+              {"kernel '1 1 1 1 x 1 1 1 1'", "weights"},
+              {"kernel '1 1 1 1 nan 1 1 1 1'", "weights"},
+              {"kernel ''", "weights"},
+              {"kernel '1,1,1 1,1,1 1,1,1' divisor=0", "divisor"}};
   for (const auto& row : rows) {
     SCOPED_TRACE(row.line);
     Recipe recipe;

@@ -11,12 +11,15 @@ namespace fotomill::test {
 namespace {
 
 PicturePointer Sweep() {
-  return MakePicture(96, 64, [](int32_t x, int32_t y) { return static_cast<uint32_t>(x * 255 / 95 << 16 | y * 255 / 63 << 8 | (x + y)); });
+  return MakePicture(96, 64, [](int32_t x, int32_t y) {
+    return static_cast<uint32_t>(x * 255 / 95 << 16 | y * 255 / 63 << 8 | (x + y));
+  });
 }
 
 Status Apply(const std::string& text, PictureRecord& picture) {
   Recipe recipe;
-  for (const Mistake& mistake : ReadRecipe(text, {}, recipe)) ADD_FAILURE() << text << ": " << mistake.Text();
+  for (const Mistake& mistake : ReadRecipe(text, {}, recipe))
+    ADD_FAILURE() << text << ": " << mistake.Text();
   return ApplySteps(picture, recipe.common, {});
 }
 
@@ -36,9 +39,11 @@ TEST(Reduce, GivesTheDepthOfItsColorsWithEveryDither) {
       {"reduce 5 gray", 4, 5},     {"reduce palette=gray", 8, 256}, {"mono", 1, 2},
   };
   for (const auto& row : rows) {
-    for (const char* dither : {"none", "floyd-steinberg", "atkinson", "stucki", "burkes", "sierra", "bayer2", "bayer4", "bayer8"}) {
+    for (const char* dither : {"none", "floyd-steinberg", "atkinson", "stucki", "burkes", "sierra",
+                               "bayer2", "bayer4", "bayer8"}) {
       for (const char* way : {"yes", "no"}) {
-        const std::string text = std::string(row.text) + " dither=" + dither + " bidirectional=" + way;
+        const std::string text =
+            std::string(row.text) + " dither=" + dither + " bidirectional=" + way;
         SCOPED_TRACE(text);
         const PicturePointer picture = Sweep();
         AddAlpha(*picture, [](int32_t x, int32_t) { return 2 * x; });
@@ -53,14 +58,17 @@ TEST(Reduce, GivesTheDepthOfItsColorsWithEveryDither) {
   }
 }
 
-// Dithering keeps the mean of an area wherever the palette reaches black and white. Atkinson drops errors, so it does not.
+// Dithering keeps the mean of an area wherever the palette reaches black and white. Atkinson drops
+// errors, so it does not.
 TEST(Reduce, DithersKeepTheMean) {
   for (const char* reduce : {"mono", "reduce 2 fixed", "reduce 4 gray"}) {
-    for (const char* dither : {"floyd-steinberg", "stucki", "burkes", "sierra", "bayer4", "bayer8"}) {
+    for (const char* dither :
+         {"floyd-steinberg", "stucki", "burkes", "sierra", "bayer4", "bayer8"}) {
       for (const int32_t level : {20, 77, 128, 200, 240}) {
         const std::string text = std::string(reduce) + " dither=" + dither;
         SCOPED_TRACE(text + ", level " + std::to_string(level));
-        const PicturePointer picture = MakePicture(128, 128, [=](int32_t, int32_t) { return static_cast<uint32_t>(level) * 0x010101u; });
+        const PicturePointer picture = MakePicture(
+            128, 128, [=](int32_t, int32_t) { return static_cast<uint32_t>(level) * 0x010101u; });
         ASSERT_EQ(Apply(text, *picture), Status::Ok);
         double sum = 0;
         for (const uint32_t color : Colors(*picture)) sum += color & 255;
@@ -74,8 +82,13 @@ TEST(Reduce, DithersKeepTheMean) {
 TEST(Reduce, DiffusesErrorsByTheirKernels) {
   const struct {
     const char* dither;
-    int32_t level;  // of the pixel behind a gray of 100: white with the error it gets, black just below
-  } rows[] = {{"floyd-steinberg", 128 - 44}, {"atkinson", 128 - 13}, {"stucki", 128 - 19}, {"burkes", 128 - 25}, {"sierra", 128 - 16}};
+    // of the pixel behind a gray of 100: white with the error it gets, black just below
+    int32_t level;
+  } rows[] = {{"floyd-steinberg", 128 - 44},
+              {"atkinson", 128 - 13},
+              {"stucki", 128 - 19},
+              {"burkes", 128 - 25},
+              {"sierra", 128 - 16}};
   for (const auto& row : rows) {
     for (const int32_t below : {0, 1}) {
       SCOPED_TRACE(row.dither + std::string(" less ") + std::to_string(below));
@@ -90,7 +103,8 @@ TEST(Reduce, DiffusesErrorsByTheirKernels) {
 }
 
 TEST(Reduce, FewColorsAreKeptExactly) {
-  const PicturePointer picture = MakePicture(50, 40, [](int32_t x, int32_t y) { return Scatter(x, y) % 11 * 0x050301u; });
+  const PicturePointer picture =
+      MakePicture(50, 40, [](int32_t x, int32_t y) { return Scatter(x, y) % 11 * 0x050301u; });
   const std::vector<uint32_t> before = Colors(*picture);
   ASSERT_EQ(Apply("reduce 200", *picture), Status::Ok);
   EXPECT_EQ(picture->image.Bits(), 4);
@@ -112,7 +126,8 @@ TEST(Mono, CutsAsThresholdDoes) {
 
 std::string ActOf(int32_t colors, bool trailer) {
   std::string bytes(768, '\0');
-  for (int32_t i = 0; i < 3 * colors; ++i) bytes[static_cast<size_t>(i)] = static_cast<char>(i * 40 + 1);
+  for (int32_t i = 0; i < 3 * colors; ++i)
+    bytes[static_cast<size_t>(i)] = static_cast<char>(i * 40 + 1);
   if (trailer) bytes += {'\0', static_cast<char>(colors), '\xff', '\xff'};
   return bytes;
 }
@@ -165,9 +180,12 @@ TEST(Reduce, TakesTheColorsOfAFile) {
   const std::string path = folder.Path("colors.ccl");
   WriteText(path, "255 0 0\n0 255 0\n0 0 255\n");
   WriteText(folder.Path("broken.ccl"), "red\n");
-  const KeyValues keys = [&](std::string_view key) { return key == "ColourTableFile" ? path : std::string(); };
+  const KeyValues keys = [&](std::string_view key) {
+    return key == "ColourTableFile" ? path : std::string();
+  };
   const std::set<uint32_t> primaries{0xff0000, 0x00ff00, 0x0000ff};
-  for (const std::string& text : {"reduce palette=" + path, std::string("reduce palette=file"), "reduce palette=file file=" + path}) {
+  for (const std::string& text : {"reduce palette=" + path, std::string("reduce palette=file"),
+                                  "reduce palette=file file=" + path}) {
     SCOPED_TRACE(text);
     Recipe recipe;
     ASSERT_TRUE(ReadRecipe(text, keys, recipe).empty());
@@ -176,8 +194,10 @@ TEST(Reduce, TakesTheColorsOfAFile) {
     EXPECT_EQ(picture->image.Bits(), 4);
     for (const uint32_t color : Colors(*picture)) ASSERT_TRUE(primaries.contains(color));
   }
-  for (const std::string& text : {"reduce palette=" + folder.Path("broken.ccl"), "reduce palette=" + folder.Path("none.ccl"),
-                                  std::string("reduce palette=/dev/zero"), "reduce palette=file file=" + folder.Path("none.ccl")}) {
+  for (const std::string& text :
+       {"reduce palette=" + folder.Path("broken.ccl"), "reduce palette=" + folder.Path("none.ccl"),
+        std::string("reduce palette=/dev/zero"),
+        "reduce palette=file file=" + folder.Path("none.ccl")}) {
     SCOPED_TRACE(text);
     Recipe recipe;
     const auto mistakes = ReadRecipe(text, keys, recipe);

@@ -18,13 +18,16 @@ const EngineOptions kSerial;
 
 Status Apply(PictureRecord& picture, const std::string& text) {
   Recipe recipe;
-  for (const Mistake& mistake : ReadRecipe(text, {}, recipe)) ADD_FAILURE() << text << ": " << mistake.Text();
+  for (const Mistake& mistake : ReadRecipe(text, {}, recipe))
+    ADD_FAILURE() << text << ": " << mistake.Text();
   return ApplySteps(picture, recipe.common, kSerial);
 }
 
 // A picture of 5 x 3 pixels of any depth that uses `used` colors of its palette.
 PicturePointer SmallPicture(int32_t bits, int32_t used) {
-  PicturePointer picture = MakePicture(5, 3, [](int32_t x, int32_t y) { return static_cast<uint32_t>(0x203040 + 0x0a0000 * x + 0x11 * y); });
+  PicturePointer picture = MakePicture(5, 3, [](int32_t x, int32_t y) {
+    return static_cast<uint32_t>(0x203040 + 0x0a0000 * x + 0x11 * y);
+  });
   if (bits == 24) return picture;
   Palette palette{};
   for (size_t i = 0; i < palette.size(); ++i) palette[i] = static_cast<uint8_t>(i * 7 + 3);
@@ -114,14 +117,16 @@ TEST(Transforms, TrimCutsTheBorderOff) {
     ASSERT_EQ(Apply(*picture, row.line), Status::Ok);
     std::vector<uint32_t> kept;
     for (int32_t y = 0; y < row.kept.height; ++y) {
-      for (int32_t x = 0; x < row.kept.width; ++x) kept.push_back(before[static_cast<size_t>((y + row.kept.y) * 20 + x + row.kept.x)]);
+      for (int32_t x = 0; x < row.kept.width; ++x)
+        kept.push_back(before[static_cast<size_t>((y + row.kept.y) * 20 + x + row.kept.x)]);
     }
     EXPECT_EQ(picture->image.Width(), row.kept.width);
     EXPECT_EQ(Colors(*picture), kept);
   }
 }
 
-// What interpolation is by definition: pixels weighed by a kernel, colors by their alpha too; the backdrop beyond the edges.
+// What interpolation is by definition: pixels weighed by a kernel, colors by their alpha too; the
+// backdrop beyond the edges.
 struct Sampler {
   const PictureRecord& picture;
   double (*kernel)(double);
@@ -143,7 +148,8 @@ struct Sampler {
         sums[3] += weight;
       }
     }
-    for (size_t c = 0; c < 3; ++c) sums[c] = std::clamp(sums[c] / std::max(sums[3], 1e-9), 0.0, 255.0);
+    for (size_t c = 0; c < 3; ++c)
+      sums[c] = std::clamp(sums[c] / std::max(sums[3], 1e-9), 0.0, 255.0);
     sums[3] = std::clamp(sums[3], 0.0, 255.0);
     return sums;
   }
@@ -151,7 +157,9 @@ struct Sampler {
 
 double Cubic(double x) {
   x = std::abs(x);
-  return x < 1 ? 1.5 * x * x * x - 2.5 * x * x + 1 : x < 2 ? -0.5 * x * x * x + 2.5 * x * x - 4 * x + 2 : 0;
+  return x < 1   ? 1.5 * x * x * x - 2.5 * x * x + 1
+         : x < 2 ? -0.5 * x * x * x + 2.5 * x * x - 4 * x + 2
+                 : 0;
 }
 double Tent(double x) { return std::max(0.0, 1 - std::abs(x)); }
 
@@ -173,18 +181,34 @@ TEST(Transforms, SampleWhereTheFormulaSays) {
     Spot (*from)(Spot spot);
   } rows[] = {
       {"rotate 7 background=red", 45, 34, Cubic, false, [](Spot p) { return Turned(p, 7); }},
-      {"rotate -33 background=red mode=keep filter=bilinear", 41, 29, Tent, false, [](Spot p) { return Turned(p, -33); }},
+      {"rotate -33 background=red mode=keep filter=bilinear", 41, 29, Tent, false,
+       [](Spot p) { return Turned(p, -33); }},
       {"rotate 200 background=red", 49, 42, Cubic, false, [](Spot p) { return Turned(p, 200); }},
       {"straighten 3", 39, 26, Cubic, true, [](Spot p) { return Turned(p, 3); }},
-      {"shear 20 background=red", 52, 29, Cubic, false, [](Spot p) { return Spot{p.x - std::tan(20 * kDegree) * p.y, p.y}; }},
-      {"shear down=20 background=red", 41, 44, Cubic, false, [](Spot p) { return Spot{p.x, p.y - std::tan(20 * kDegree) * p.x}; }},
+      {"shear 20 background=red", 52, 29, Cubic, false,
+       [](Spot p) {
+         return Spot{p.x - std::tan(20 * kDegree) * p.y, p.y};
+       }},
+      {"shear down=20 background=red", 41, 44, Cubic, false,
+       [](Spot p) {
+         return Spot{p.x, p.y - std::tan(20 * kDegree) * p.x};
+       }},
       {"perspective 5,0 41,4 41,29 5,25 background=red filter=bilinear", 36, 25, Tent, false,
-       [](Spot p) { return Spot{p.x + 18 + 5 - 20.5, p.y + 12.5 + (p.x + 18) / 36 * 4 - 14.5}; }},
-      {"wave 4 30", 41, 29, Cubic, true, [](Spot p) { return Spot{p.x, p.y - 4 * std::sin(2 * std::numbers::pi * (p.x + 20) / 30)}; }},
-      {"wave 4 30 horizontal", 41, 29, Cubic, true, [](Spot p) { return Spot{p.x - 4 * std::sin(2 * std::numbers::pi * (p.y + 14) / 30), p.y}; }},
+       [](Spot p) {
+         return Spot{p.x + 18 + 5 - 20.5, p.y + 12.5 + (p.x + 18) / 36 * 4 - 14.5};
+       }},
+      {"wave 4 30", 41, 29, Cubic, true,
+       [](Spot p) {
+         return Spot{p.x, p.y - 4 * std::sin(2 * std::numbers::pi * (p.x + 20) / 30)};
+       }},
+      {"wave 4 30 horizontal", 41, 29, Cubic, true,
+       [](Spot p) {
+         return Spot{p.x - 4 * std::sin(2 * std::numbers::pi * (p.y + 14) / 30), p.y};
+       }},
       {"ripple 3 20", 41, 29, Cubic, true,
        [](Spot p) {
-         const double r = std::hypot(p.x, p.y), way = r == 0 ? 0 : 3 * std::sin(2 * std::numbers::pi * r / 20) / r;
+         const double r = std::hypot(p.x, p.y),
+                      way = r == 0 ? 0 : 3 * std::sin(2 * std::numbers::pi * r / 20) / r;
          return Spot{p.x * (1 - way), p.y * (1 - way)};
        }},
       {"swirl 100 radius=14", 41, 29, Cubic, true,
@@ -194,7 +218,8 @@ TEST(Transforms, SampleWhereTheFormulaSays) {
        }},
       {"bulge 60% radius=14", 41, 29, Cubic, true,
        [](Spot p) {
-         const double share = std::max(0.0, 1 - (p.x * p.x + p.y * p.y) / 196), scale = 1 - 0.6 * share * share;
+         const double share = std::max(0.0, 1 - (p.x * p.x + p.y * p.y) / 196),
+                      scale = 1 - 0.6 * share * share;
          return Spot{p.x * scale, p.y * scale};
        }},
   };
@@ -202,8 +227,11 @@ TEST(Transforms, SampleWhereTheFormulaSays) {
     for (const bool alpha : {false, true}) {
       SCOPED_TRACE(std::string(row.line) + (alpha ? " with alpha" : ""));
       const auto make = [&] {
-        PicturePointer picture = MakePicture(41, 29, [](int32_t x, int32_t y) { return Scatter(x / 2, y / 3) & 0xffffff; });
-        if (alpha) AddAlpha(*picture, [](int32_t x, int32_t y) { return x < 15 ? 0 : std::min(255, 6 * x + y); });
+        PicturePointer picture = MakePicture(
+            41, 29, [](int32_t x, int32_t y) { return Scatter(x / 2, y / 3) & 0xffffff; });
+        if (alpha)
+          AddAlpha(*picture,
+                   [](int32_t x, int32_t y) { return x < 15 ? 0 : std::min(255, 6 * x + y); });
         return picture;
       };
       const PicturePointer picture = make(), source = make();
@@ -219,7 +247,9 @@ TEST(Transforms, SampleWhereTheFormulaSays) {
             ASSERT_NEAR(picture->alpha.PixelAt(x, y), expected[3], 1.5) << x << ", " << y;
           }
           if (alpha && expected[3] < 40) continue;
-          for (size_t c = 0; c < 3; ++c) ASSERT_NEAR(ColorAt(*picture, x, y) >> (8 * c) & 255, expected[c], alpha ? 4 : 1.5) << x << ", " << y;
+          for (size_t c = 0; c < 3; ++c)
+            ASSERT_NEAR(ColorAt(*picture, x, y) >> (8 * c) & 255, expected[c], alpha ? 4 : 1.5)
+                << x << ", " << y;
         }
       }
     }
@@ -236,7 +266,8 @@ TEST(Transforms, SamplesAreTheSameOnEveryProcessor) {
     Weights weights[2];
     for (auto& line : weights) {
       const double place = (Scatter(n, &line == weights ? 99 : 98) & 1023) / 1024.0;
-      for (int i = 0; i < 4; ++i) line[i] = static_cast<int16_t>(std::lround(Cubic(i - 1 - place) * kWeightOne));
+      for (int i = 0; i < 4; ++i)
+        line[i] = static_cast<int16_t>(std::lround(Cubic(i - 1 - place) * kWeightOne));
     }
     const uint8_t* const pointers[] = {rows[0], rows[1], rows[2], rows[3]};
     uint8_t here[3], plain[3];
@@ -251,7 +282,10 @@ TEST(Transforms, FindHowAPageIsTurned) {
     const double slope = std::tan(angle * kDegree);
     const PicturePointer page = MakePicture(700, 500, [&](int32_t x, int32_t y) {
       const double line = y - slope * x + 1000;
-      return std::fmod(line, 24) < 10 && x > 50 && x < 650 && Scatter(x / 5, static_cast<int32_t>(line / 24)) % 4 != 0 ? 0x202020u : 0xf0f0e8u;
+      return std::fmod(line, 24) < 10 && x > 50 && x < 650 &&
+                     Scatter(x / 5, static_cast<int32_t>(line / 24)) % 4 != 0
+                 ? 0x202020u
+                 : 0xf0f0e8u;
     });
     double found = 99;
     ASSERT_EQ(FindSkew(*page, 15, {}, found), Status::Ok);

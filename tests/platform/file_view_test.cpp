@@ -52,7 +52,8 @@ TEST(FileView, ShowsTheWholeFileOrItsHead) {
       EXPECT_TRUE(view.ReadAt(seen, rest));  // the file behind the head
       EXPECT_TRUE(Equal(rest, std::span(bytes).subspan(seen)));
       uint8_t one[1];
-      for (const uint64_t past : {uint64_t{size}, UINT64_MAX}) EXPECT_FALSE(view.ReadAt(past, one)) << past;
+      for (const uint64_t past : {uint64_t{size}, UINT64_MAX})
+        EXPECT_FALSE(view.ReadAt(past, one)) << past;
     }
     FileView moved = std::move(view);
     EXPECT_TRUE(view.Bytes().empty());
@@ -72,8 +73,10 @@ TEST(FileView, WhatIsNoRegularFileDoesNotOpen) {
   fs::create_symlink("fifo", folder.Path("to fifo"));
   WriteBytes(folder.Path("regular"), Pattern(10));
   FileView view;
-  for (const std::string& path : {folder.Path("fifo"), folder.Path("folder"), folder.Path("dangling"), folder.Path("to fifo"),
-                                  folder.Path("missing"), std::string("/dev/null"), std::string("/dev/zero"), std::string()}) {
+  for (const std::string& path :
+       {folder.Path("fifo"), folder.Path("folder"), folder.Path("dangling"), folder.Path("to fifo"),
+        folder.Path("missing"), std::string("/dev/null"), std::string("/dev/zero"),
+        std::string()}) {
     ASSERT_TRUE(view.Open(folder.Path("regular")));
     EXPECT_FALSE(view.Open(path)) << path;
     EXPECT_TRUE(view.Bytes().empty()) << path;

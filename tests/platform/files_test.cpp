@@ -120,8 +120,9 @@ TEST_F(FilesTest, FactsTellSizeTimesAndIdentity) {
 
 TEST(Files, ListingKeepsAnyNameInByteOrder) {
   const TemporaryFolder folder;
-  const std::vector<std::string> names = {"\nnew line", " blank", "\"quoted\"", "--help",   ".hidden",
-                                          "B",          "a",      "a\\b",       "\xC3\xA9", "\xFF\xFE"};
+  const std::vector<std::string> names = {"\nnew line", " blank",  "\"quoted\"", "--help",
+                                          ".hidden",    "B",       "a",          "a\\b",
+                                          "\xC3\xA9",   "\xFF\xFE"};
   for (const std::string& name : names) WriteText(folder.Path(name), "");
   std::vector<std::string> listed;
   const std::vector<FolderEntry> entries = ListFolder(folder.Path()).value();
@@ -142,18 +143,21 @@ TEST_F(FilesTest, MakesFoldersWithTheirParents) {
   EXPECT_TRUE(MakeFolders(Path("a/b")));
   EXPECT_TRUE(MakeFolders(Path("to folder/x")));
   EXPECT_TRUE(IsFolder(Path("folder/x")));
-  for (const char* name : {"regular", "regular/x", "to nothing", "fifo/x"}) EXPECT_FALSE(MakeFolders(Path(name))) << name;
+  for (const char* name : {"regular", "regular/x", "to nothing", "fifo/x"})
+    EXPECT_FALSE(MakeFolders(Path(name))) << name;
   EXPECT_FALSE(MakeFolders(""));
 }
 
 TEST_F(FilesTest, DeletesFilesAndLinksNeverFolders) {
-  for (const char* name : {"folder", "nothing", "regular/x"}) EXPECT_FALSE(DeleteFile(Path(name))) << name;
+  for (const char* name : {"folder", "nothing", "regular/x"})
+    EXPECT_FALSE(DeleteFile(Path(name))) << name;
   for (const char* name : {"to folder", "to nothing", "to regular", "fifo", "circle"})
     EXPECT_TRUE(DeleteFile(Path(name))) << name;
   EXPECT_THAT(folder_.Names(), ElementsAre("folder", "regular"));
 }
 
-constexpr RefusingRename allWays[] = {RefusingRename::Directly, RefusingRename::ByLink, RefusingRename::ByPlaceholder};
+constexpr RefusingRename allWays[] = {RefusingRename::Directly, RefusingRename::ByLink,
+                                      RefusingRename::ByPlaceholder};
 
 TEST_F(FilesTest, RenamesAsAsked) {
   WriteText(Path("new"), "new");
@@ -196,13 +200,16 @@ TEST(Files, OneWinsARaceForAName) {
     CommitResult results[kRunners];
     std::vector<std::thread> runners;
     for (int i = 0; i < kRunners; ++i) {
-      runners.emplace_back(
-          [&, i] { results[i] = RenameFile(folder.Path(std::to_string(i)), folder.Path("name"), Existing::Refuse); });
+      runners.emplace_back([&, i] {
+        results[i] =
+            RenameFile(folder.Path(std::to_string(i)), folder.Path("name"), Existing::Refuse);
+      });
     }
     for (std::thread& runner : runners) runner.join();
     EXPECT_EQ(std::count(results, results + kRunners, CommitResult::Done), 1);
     EXPECT_EQ(std::count(results, results + kRunners, CommitResult::Taken), kRunners - 1);
-    const int winner = static_cast<int>(std::find(results, results + kRunners, CommitResult::Done) - results);
+    const int winner =
+        static_cast<int>(std::find(results, results + kRunners, CommitResult::Done) - results);
     EXPECT_EQ(ReadText(folder.Path("name")), std::to_string(winner));
     EXPECT_EQ(folder.Names().size(), static_cast<size_t>(kRunners));  // the losers keep theirs
     ASSERT_TRUE(DeleteFile(folder.Path("name")));

@@ -31,7 +31,9 @@ using test::WriteText;
 using testing::ElementsAre;
 using testing::HasSubstr;
 
-std::span<const uint8_t> BytesOf(std::string_view text) { return {reinterpret_cast<const uint8_t*>(text.data()), text.size()}; }
+std::span<const uint8_t> BytesOf(std::string_view text) {
+  return {reinterpret_cast<const uint8_t*>(text.data()), text.size()};
+}
 
 CommitResult WriteAs(const std::string& path, std::string_view text) {
   OutputFile file;
@@ -126,7 +128,8 @@ TEST_P(HeldFileTest, RunsKeepApart) {
     if (child != 0) continue;
     for (int i = 0; i < kTimes; ++i) {
       HeldFile held;
-      if (!held.Hold(Path()) || WriteAs(Path(), ReadText(Path()) + "x") != CommitResult::Done) _exit(1);
+      if (!held.Hold(Path()) || WriteAs(Path(), ReadText(Path()) + "x") != CommitResult::Done)
+        _exit(1);
     }
     _exit(0);
   }
@@ -142,13 +145,21 @@ TEST(ReplacedFile, KeepsWhatBelongsToTheFile) {
   const TemporaryFolder folder;
   const std::string path = folder.Path("file");
   WriteText(path, "old");
-  if (setxattr(path.c_str(), "user.rating", "5", 1, 0) != 0) GTEST_SKIP() << "no extended attributes here";
+  if (setxattr(path.c_str(), "user.rating", "5", 1, 0) != 0)
+    GTEST_SKIP() << "no extended attributes here";
   const std::string longer(2000, 't');
   ASSERT_EQ(setxattr(path.c_str(), "user.tags", longer.data(), longer.size(), 0), 0);
   // Version 2; the owner rw, user 65533 r, the group none, mask r, others none.
-  const std::string list("\2\0\0\0" "\1\0\6\0\xff\xff\xff\xff" "\2\0\4\0\xfd\xff\0\0" "\4\0\0\0\xff\xff\xff\xff"
-                         "\20\0\4\0\xff\xff\xff\xff" "\40\0\0\0\xff\xff\xff\xff", 44);
-  const bool hasList = setxattr(path.c_str(), "system.posix_acl_access", list.data(), list.size(), 0) == 0;
+  const std::string list(
+      "\2\0\0\0"
+      "\1\0\6\0\xff\xff\xff\xff"
+      "\2\0\4\0\xfd\xff\0\0"
+      "\4\0\0\0\xff\xff\xff\xff"
+      "\20\0\4\0\xff\xff\xff\xff"
+      "\40\0\0\0\xff\xff\xff\xff",
+      44);
+  const bool hasList =
+      setxattr(path.c_str(), "system.posix_acl_access", list.data(), list.size(), 0) == 0;
   const bool root = geteuid() == 0;
   if (root) {
     ASSERT_EQ(chown(path.c_str(), 1234, 4321), 0);

@@ -14,7 +14,8 @@ namespace fotomill::platform {
 namespace {
 
 constexpr uint64_t kMega = uint64_t{1} << 20;
-constexpr uint64_t kSizes[] = {0, 1, 1000, kMega - 1, kMega, kMega + 1, 2 * kMega, 4 * kMega, 4 * kMega + 1, 9 * kMega};
+constexpr uint64_t kSizes[] = {0,         1,         1000,      kMega - 1,     kMega,
+                               kMega + 1, 2 * kMega, 4 * kMega, 4 * kMega + 1, 9 * kMega};
 
 bool AllAre(std::span<const uint8_t> bytes, uint8_t value) {
   return std::all_of(bytes.begin(), bytes.end(), [value](uint8_t byte) { return byte == value; });
@@ -70,8 +71,8 @@ TEST(MemoryBlock, WhatCannotBeHadFails) {
   }
   EXPECT_EQ(test::ForEachFault([] {
               MemoryBlock block;
-              const bool done =
-                  block.Allocate(5 * kMega) && block.Resize(4 * kMega) && block.Resize(20 * kMega) && block.Resize(10);
+              const bool done = block.Allocate(5 * kMega) && block.Resize(4 * kMega) &&
+                                block.Resize(20 * kMega) && block.Resize(10);
               EXPECT_EQ(done, faultCountdown > 0);
             }),
             4);
@@ -86,9 +87,13 @@ TEST(MemoryBlock, ManyThreadsShareThePool) {
       for (unsigned i = 0; i < 120; ++i) {
         MemoryBlock& block = held[i % 3];
         const uint8_t mark = static_cast<uint8_t>(16 * (t + 1) + i % 3);
-        if (!block.Empty() && !(block.Data()[0] == mark && block.Data()[block.Size() - 1] == mark)) ++faults;
-        const uint64_t size = kMega + (i * 7919u + static_cast<unsigned>(t) * 104729u) % (3 * kMega);
-        if (!block.Allocate(size) || block.Data()[0] != 0 || block.Data()[size / 2] != 0 || block.Data()[size - 1] != 0) ++faults;
+        if (!block.Empty() && !(block.Data()[0] == mark && block.Data()[block.Size() - 1] == mark))
+          ++faults;
+        const uint64_t size =
+            kMega + (i * 7919u + static_cast<unsigned>(t) * 104729u) % (3 * kMega);
+        if (!block.Allocate(size) || block.Data()[0] != 0 || block.Data()[size / 2] != 0 ||
+            block.Data()[size - 1] != 0)
+          ++faults;
         block.Data()[0] = block.Data()[size / 2] = block.Data()[size - 1] = mark;
         if (i % 40 == 0) TrimMemoryPool();
       }

@@ -25,7 +25,9 @@ using test::WriteText;
 using testing::ElementsAre;
 using testing::IsEmpty;
 
-std::span<const uint8_t> BytesOf(std::string_view text) { return {reinterpret_cast<const uint8_t*>(text.data()), text.size()}; }
+std::span<const uint8_t> BytesOf(std::string_view text) {
+  return {reinterpret_cast<const uint8_t*>(text.data()), text.size()};
+}
 
 // Every case runs on each way that a system may have of making a file appear.
 class OutputFileTest : public testing::TestWithParam<UnnamedFiles> {
@@ -36,11 +38,14 @@ class OutputFileTest : public testing::TestWithParam<UnnamedFiles> {
   TemporaryFolder folder_;
 };
 INSTANTIATE_TEST_SUITE_P(Systems, OutputFileTest,
-                         testing::Values(UnnamedFiles::Work, UnnamedFiles::DoNotWork, UnnamedFiles::GetNoName));
+                         testing::Values(UnnamedFiles::Work, UnnamedFiles::DoNotWork,
+                                         UnnamedFiles::GetNoName));
 
-CommitResult WriteAs(const std::string& path, std::string_view text, Existing existing, bool sync = false) {
+CommitResult WriteAs(const std::string& path, std::string_view text, Existing existing,
+                     bool sync = false) {
   OutputFile file;
-  if (!file.Create(path) || !file.Write(BytesOf("?")) || !file.Write(BytesOf(text.substr(1)))) return CommitResult::Failed;
+  if (!file.Create(path) || !file.Write(BytesOf("?")) || !file.Write(BytesOf(text.substr(1))))
+    return CommitResult::Failed;
   if (!file.WriteAt(0, BytesOf(text.substr(0, 1)))) return CommitResult::Failed;
   return file.Commit(existing, sync);
 }
@@ -69,8 +74,9 @@ TEST_P(OutputFileTest, WhatMayNotBecomeAFileStays) {
   WriteText(Path("folder/inner"), "inner");
   ASSERT_EQ(mkfifo(Path("fifo").c_str(), 0600), 0);
   WriteText(Path("regular"), "old");
-  for (const std::string& name : {Path("folder"), Path("fifo"), Path("folder/"), Path("."), Path("no/such"), Path("regular/x"),
-                                  Path(std::string(256, 'n')), std::string()}) {
+  for (const std::string& name :
+       {Path("folder"), Path("fifo"), Path("folder/"), Path("."), Path("no/such"),
+        Path("regular/x"), Path(std::string(256, 'n')), std::string()}) {
     OutputFile file;
     EXPECT_FALSE(file.Create(name)) << name;
     EXPECT_FALSE(file.Write(BytesOf("x"))) << name;
@@ -83,7 +89,8 @@ TEST_P(OutputFileTest, WhatMayNotBecomeAFileStays) {
   EXPECT_THAT(folder_.Names(), ElementsAre("fifo", "folder", "late", "regular"));
   ASSERT_EQ(chmod(Path("regular").c_str(), 0444), 0);
   ASSERT_EQ(chmod(folder_.Path().c_str(), 0777), 0);
-  const bool stepsDown = geteuid() == 0 && seteuid(65534) == 0;  // the superuser may write to everything
+  // the superuser may write to everything
+  const bool stepsDown = geteuid() == 0 && seteuid(65534) == 0;
   EXPECT_EQ(WriteAs(Path("regular"), "new", Existing::Replace), CommitResult::Failed);
   if (stepsDown) {
     ASSERT_EQ(seteuid(0), 0);
@@ -139,7 +146,8 @@ TEST_P(OutputFileTest, OldOrNewAndNothingBesideWhateverFails) {
     EXPECT_GE(test::ForEachFault([&] {
                 fs::remove(Path("file"));
                 if (row.old) WriteText(Path("file"), "old");
-                const bool done = WriteAs(Path("file"), text, row.existing, row.sync) == CommitResult::Done;
+                const bool done =
+                    WriteAs(Path("file"), text, row.existing, row.sync) == CommitResult::Done;
                 EXPECT_EQ(ReadText(Path("file")), done ? text : row.old ? "old" : "");
                 EXPECT_EQ(folder_.Names().size(), done || row.old ? 1u : 0u);
               }),
@@ -166,7 +174,8 @@ TEST_P(OutputFileTest, AFullDiskLeavesTheOldFile) {
 
 TEST_P(OutputFileTest, AnEndedProgramLeavesNothing) {
   for (const int number : {SIGKILL, SIGTERM}) {
-    if (number == SIGKILL && GetParam() == UnnamedFiles::DoNotWork) continue;  // only a name can be left behind
+    // only a name can be left behind
+    if (number == SIGKILL && GetParam() == UnnamedFiles::DoNotWork) continue;
     const int status = test::InChild([&] {
       OutputFile file;
       if (!file.Create(Path("file")) || !file.Write(BytesOf("text"))) _exit(1);
@@ -186,12 +195,14 @@ TEST_P(OutputFileTest, OneWinsARaceForAName) {
     CommitResult results[kRunners];
     std::vector<std::thread> runners;
     for (int i = 0; i < kRunners; ++i) {
-      runners.emplace_back([&, i] { results[i] = WriteAs(Path("name"), std::to_string(i), Existing::Refuse); });
+      runners.emplace_back(
+          [&, i] { results[i] = WriteAs(Path("name"), std::to_string(i), Existing::Refuse); });
     }
     for (std::thread& runner : runners) runner.join();
     EXPECT_EQ(std::count(results, results + kRunners, CommitResult::Done), 1);
     EXPECT_EQ(std::count(results, results + kRunners, CommitResult::Taken), kRunners - 1);
-    const int winner = static_cast<int>(std::find(results, results + kRunners, CommitResult::Done) - results);
+    const int winner =
+        static_cast<int>(std::find(results, results + kRunners, CommitResult::Done) - results);
     EXPECT_EQ(ReadText(Path("name")), std::to_string(winner));
     EXPECT_THAT(folder_.Names(), ElementsAre("name"));
     fs::remove(Path("name"));

@@ -45,7 +45,8 @@ TEST(Clock, TellsTheWallClock) {
 // A program file that writes its arguments, one a line, into `out`.
 std::string ArgumentPrinter(const TemporaryFolder& folder, const std::string& out) {
   const std::string path = folder.Path("printer");
-  WriteText(path, "#!/bin/sh\nprintf '%s\\n' \"$@\" >'" + out + ".part'\nmv '" + out + ".part' '" + out + "'\n");
+  WriteText(path, "#!/bin/sh\nprintf '%s\\n' \"$@\" >'" + out + ".part'\nmv '" + out + ".part' '" +
+                      out + "'\n");
   std::filesystem::permissions(path, std::filesystem::perms::owner_all);
   return path;
 }
@@ -62,7 +63,8 @@ TEST(Process, ArgumentsArriveAsTheyAre) {
   EXPECT_EQ(ReadText(out), "found\n");
   ASSERT_TRUE(DeleteFile(out));
   ASSERT_TRUE(RunProgram({"printer", "later"}, false));
-  for (int i = 0; i < 2000 && !FileExists(out); ++i) std::this_thread::sleep_for(std::chrono::milliseconds(5));
+  for (int i = 0; i < 2000 && !FileExists(out); ++i)
+    std::this_thread::sleep_for(std::chrono::milliseconds(5));
   EXPECT_EQ(ReadText(out), "later\n");
 }
 
@@ -72,7 +74,8 @@ TEST(Process, WhatIsNoProgramDoesNotStart) {
   WriteText(folder.Path("garbage"), "no program at all");
   std::filesystem::permissions(folder.Path("garbage"), std::filesystem::perms::owner_all);
   const ScopedEnvironment path("PATH", folder.Path() + ":.");
-  for (const char* name : {"", "text", "garbage", "missing", "/", "."}) EXPECT_FALSE(RunProgram({name}, true)) << name;
+  for (const char* name : {"", "text", "garbage", "missing", "/", "."})
+    EXPECT_FALSE(RunProgram({name}, true)) << name;
   EXPECT_FALSE(RunProgram({}, true));
   EXPECT_TRUE(ProgramFor("a.bmp").empty());
   WriteText(folder.Path("xdg-open"), "#!/bin/sh\n");

@@ -19,7 +19,8 @@ std::string LoadedFile(std::string_view name) {
   std::istringstream maps(test::ReadText("/proc/self/maps"));
   for (std::string line; std::getline(maps, line);) {
     const size_t start = line.find('/');
-    if (start != std::string::npos && line.find(name, start) != std::string::npos) return line.substr(start);
+    if (start != std::string::npos && line.find(name, start) != std::string::npos)
+      return line.substr(start);
   }
   return {};
 }
@@ -66,7 +67,8 @@ TEST(SharedLibrary, RefusesWhatIsNoModule) {
     EXPECT_NE(library.Error(), "") << path;
     EXPECT_FALSE(library.Loaded()) << path;
   }
-  for (const std::string& name : {std::string(), std::string("libno-such.so.9"), LoadedFile("/libm.so")}) {
+  for (const std::string& name :
+       {std::string(), std::string("libno-such.so.9"), LoadedFile("/libm.so")}) {
     EXPECT_FALSE(library.LoadSystem(name)) << name;
     EXPECT_NE(library.Error(), "") << name;
   }

@@ -23,7 +23,9 @@ using test::ReadText;
 using test::TemporaryFolder;
 using test::WriteText;
 
-std::span<const uint8_t> BytesOf(std::string_view text) { return {reinterpret_cast<const uint8_t*>(text.data()), text.size()}; }
+std::span<const uint8_t> BytesOf(std::string_view text) {
+  return {reinterpret_cast<const uint8_t*>(text.data()), text.size()};
+}
 
 TEST(StoreFile, OpensRegularFilesOnly) {
   const TemporaryFolder folder;
@@ -154,8 +156,8 @@ TEST(StoreFile, EveryOperationMayFail) {
               const OpenResult opened = file.Open(path, Mode::CreateNew);
               EXPECT_EQ(FileExists(path), opened == OpenResult::Done);
               uint8_t byte[1] = {7};
-              const bool done =
-                  opened == OpenResult::Done && file.Lock() && file.WriteAt(0, byte) && file.Sync() && file.ReadAt(0, byte);
+              const bool done = opened == OpenResult::Done && file.Lock() &&
+                                file.WriteAt(0, byte) && file.Sync() && file.ReadAt(0, byte);
               EXPECT_EQ(done, faultCountdown > 0);
             }),
             5);

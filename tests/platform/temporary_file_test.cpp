@@ -26,7 +26,9 @@ using testing::ElementsAre;
 using testing::IsEmpty;
 using testing::StartsWith;
 
-std::span<const uint8_t> BytesOf(std::string_view text) { return {reinterpret_cast<const uint8_t*>(text.data()), text.size()}; }
+std::span<const uint8_t> BytesOf(std::string_view text) {
+  return {reinterpret_cast<const uint8_t*>(text.data()), text.size()};
+}
 
 // Works in a fresh temporary folder and a fresh current folder.
 class TemporaryFileTest : public testing::Test {
@@ -42,7 +44,9 @@ class TemporaryFileTest : public testing::Test {
 
 TEST_F(TemporaryFileTest, KeepsWhatAFileWasUntilItIsReplaced) {
   const std::string path = current_.Path("a.txt");
-  for (const std::string& folder : {current_.Path("new/undo"), std::string("/dev/shm/fmw-keep-test")}) {  // another volume
+  // another volume
+  for (const std::string& folder :
+       {current_.Path("new/undo"), std::string("/dev/shm/fmw-keep-test")}) {
     SCOPED_TRACE(folder);
     const int64_t faults = test::ForEachFault([&] {
       WriteText(path, "before");

@@ -23,11 +23,13 @@ using testing::IsEmpty;
 
 std::vector<std::string> NamesIn(const std::string& folder) {
   std::vector<std::string> names;
-  for (const FolderEntry& entry : ListFolder(folder).value_or(std::vector<FolderEntry>{})) names.push_back(entry.name);
+  for (const FolderEntry& entry : ListFolder(folder).value_or(std::vector<FolderEntry>{}))
+    names.push_back(entry.name);
   return names;
 }
 
-// The user's data folder is a fresh one on the device of the files that go, so that their trash is data/Trash.
+// The user's data folder is a fresh one on the device of the files that go, so that their trash is
+// data/Trash.
 class TrashTest : public testing::Test {
  protected:
   TrashTest() : data_("XDG_DATA_HOME", folder_.Path("data")), zone_("TZ", "XYZ-2") {
@@ -35,8 +37,12 @@ class TrashTest : public testing::Test {
     FixNow(951782399);
   }
   ~TrashTest() override { FixNow(-1); }
-  std::string Picture(std::string_view name) const { return folder_.Path("pictures/" + std::string(name)); }
-  std::string Trash(std::string_view name) const { return folder_.Path("data/Trash/" + std::string(name)); }
+  std::string Picture(std::string_view name) const {
+    return folder_.Path("pictures/" + std::string(name));
+  }
+  std::string Trash(std::string_view name) const {
+    return folder_.Path("data/Trash/" + std::string(name));
+  }
   TemporaryFolder folder_;
   ScopedEnvironment data_, zone_;
 };
@@ -130,7 +136,8 @@ TEST_F(TrashTest, LeavesNothingBehindWhenItCannot) {
   EXPECT_EQ(ReadText(Picture("b")), "1");
 }
 
-// Mounts a small volume of its own at `folder`, seen by this process alone. False where that is not allowed.
+// Mounts a small volume of its own at `folder`, seen by this process alone. False where that is not
+// allowed.
 bool MountVolume(const std::string& folder) {
   const std::string user = std::to_string(getuid()), group = std::to_string(getgid());
   if (unshare(CLONE_NEWNS) != 0) {
@@ -158,10 +165,11 @@ TEST_F(TrashTest, AnotherVolumeHasItsOwn) {
     const auto gone = [&](const char* name, const std::string& trash) {
       fs::create_directories(Picture("sub"));
       WriteText(Picture(std::string("sub/") + name), name);
-      return HasTrash(Picture(std::string("sub/") + name)) && MoveToTrash(Picture(std::string("sub/") + name)) &&
+      return HasTrash(Picture(std::string("sub/") + name)) &&
+             MoveToTrash(Picture(std::string("sub/") + name)) &&
              ReadText(Picture(trash + "/files/" + name)) == name &&
-             ReadText(Picture(trash + "/info/" + name + ".trashinfo")).find("\nPath=sub/" + std::string(name) + "\n") !=
-                 std::string::npos;
+             ReadText(Picture(trash + "/info/" + name + ".trashinfo"))
+                     .find("\nPath=sub/" + std::string(name) + "\n") != std::string::npos;
     };
     check(gone("a", own));
     fs::create_directory(Picture(".Trash"));

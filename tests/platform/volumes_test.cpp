@@ -55,8 +55,11 @@ class MountTest : public testing::Test {
     fs::create_directories(fs::path(path).parent_path());
     return path;
   }
-  void Link(const std::string& target, const std::string& name) const { fs::create_symlink(target, Make(name)); }
-  void Disk(const std::string& disk, const char* removable, std::vector<std::pair<std::string, std::string>> partitions) const {
+  void Link(const std::string& target, const std::string& name) const {
+    fs::create_symlink(target, Make(name));
+  }
+  void Disk(const std::string& disk, const char* removable,
+            std::vector<std::pair<std::string, std::string>> partitions) const {
     WriteText(Make("sys/devices/" + disk + "/removable"), std::string(removable) + "\n");
     Link("../../devices/" + disk, "sys/class/block/" + disk);
     for (const auto& [name, number] : partitions) {
@@ -118,7 +121,9 @@ TEST(Volumes, TheSystemsOwnAnswer) {
   EXPECT_GT(FreeSpace(folder.Path("not yet")), 0u);
   EXPECT_EQ(FreeSpace(folder.Path("no/such")), 0u);
 
-  ReplaceVolumeFunction([](const std::string& path) { return Volume{true, path, 7, DriveKind::Optical}; });
+  ReplaceVolumeFunction([](const std::string& path) {
+    return Volume{true, path, 7, DriveKind::Optical};
+  });
   EXPECT_EQ(VolumeOf("any").label, "any");
   ReplaceVolumeFunction(nullptr);
   EXPECT_EQ(VolumeOf(folder.Path("file")).serial, volume.serial);

@@ -18,7 +18,9 @@
 namespace fotomill::platform {
 namespace {
 
-std::span<const uint8_t> Bytes(std::string_view text) { return {reinterpret_cast<const uint8_t*>(text.data()), text.size()}; }
+std::span<const uint8_t> Bytes(std::string_view text) {
+  return {reinterpret_cast<const uint8_t*>(text.data()), text.size()};
+}
 
 // Whether this process has children, running or not yet waited for.
 bool HasChildren() { return waitpid(-1, nullptr, WNOHANG) >= 0 || errno != ECHILD; }
@@ -29,7 +31,8 @@ TEST(WorkApart, GivesBackWhatItSharesAndStaysForTheNext) {
     SharedBlock block;
     ASSERT_TRUE(block.Allocate(5000));
     std::vector<int32_t> told;
-    const ApartOrder order{.task = "echo", .request = Bytes("abc"), .input = Bytes(text), .reply = block};
+    const ApartOrder order{
+        .task = "echo", .request = Bytes("abc"), .input = Bytes(text), .reply = block};
     ASSERT_EQ(RunApart(order, [&](int32_t number) { told.push_back(number); }), ApartResult::Done);
     ASSERT_EQ(told.size(), 2u);
     EXPECT_EQ(told[1], 3);
@@ -60,7 +63,11 @@ TEST(WorkApart, SaysHowItEnded) {
     SCOPED_TRACE(row.task);
     SharedBlock block;
     ASSERT_TRUE(block.Allocate(10));
-    const ApartOrder order{.task = row.task, .request = Bytes(path), .reply = block, .seconds = 1, .memory = 256 << 20};
+    const ApartOrder order{.task = row.task,
+                           .request = Bytes(path),
+                           .reply = block,
+                           .seconds = 1,
+                           .memory = 256 << 20};
     EXPECT_EQ(RunApart(order, [](int32_t) {}), row.result);
   }
   EXPECT_EQ(FactsOf(path).size, 0u);
@@ -72,7 +79,9 @@ TEST(WorkApart, EndsWhenNobodyWantsItAnyMore) {
   SharedBlock block;
   ASSERT_TRUE(block.Allocate(10));
   const double begun = MonotonicSeconds();
-  const ApartOrder order{.task = "never ends", .reply = block, .goesOn = [&] { return MonotonicSeconds() < begun + 0.2; }};
+  const ApartOrder order{.task = "never ends", .reply = block, .goesOn = [&] {
+                           return MonotonicSeconds() < begun + 0.2;
+                         }};
   EXPECT_EQ(RunApart(order, [](int32_t) {}), ApartResult::Stopped);
   EXPECT_LT(MonotonicSeconds(), begun + 1);
   EXPECT_FALSE(HasChildren());
@@ -83,7 +92,8 @@ TEST(WorkApart, ALackOfMemoryOrProcessesIsNotStarted) {
   ASSERT_TRUE(block.Allocate(10));
   const int64_t faults = test::ForEachFault([&] {
     const bool planned = faultCountdown > 0;
-    const ApartResult result = RunApart({.task = "echo", .input = Bytes("in"), .reply = block}, [](int32_t) {});
+    const ApartResult result =
+        RunApart({.task = "echo", .input = Bytes("in"), .reply = block}, [](int32_t) {});
     EXPECT_EQ(result, planned && faultCountdown <= 0 ? ApartResult::NotStarted : ApartResult::Done);
     EndIdleProcesses();
   });

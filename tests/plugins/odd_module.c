@@ -1,6 +1,6 @@
 /*
- * A module that misbehaves in one way, chosen by a macro at build time; everything else about it is in order. Its
- * pictures are 2 x 1 of 24 bits, blue and red, whatever the file holds.
+ * A module that misbehaves in one way, chosen by a macro at build time; everything else about it is
+ * in order. Its pictures are 2 x 1 of 24 bits, blue and red, whatever the file holds.
  */
 #include <stdio.h>
 #include <stdlib.h>
@@ -36,8 +36,8 @@ FMW_EXPORT int32_t FMW_CALL PLUGIN11GetPluginParams(FMW_PLUGIN_PARAMS* params, i
 }
 
 #if !defined(NO_INFO_EXPORT)
-FMW_EXPORT int32_t FMW_CALL PLUGIN11GetInfo(FMW_PICTURE_INFO* info, const char* fileName, int32_t* error,
-                                            const FMW_HOST_SERVICES* services) {
+FMW_EXPORT int32_t FMW_CALL PLUGIN11GetInfo(FMW_PICTURE_INFO* info, const char* fileName,
+                                            int32_t* error, const FMW_HOST_SERVICES* services) {
   (void)fileName;
   info->width = 2;
   info->height = 1;
@@ -72,7 +72,8 @@ FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN11ReadImage(const char* fileName, int32_t* 
 #if defined(LOADS_ANOTHER)
   if (strstr(fileName, "inner") == 0) {
     char inner[300];
-    snprintf(inner, sizeof inner, "%.*sinner.odd", (int)(strrchr(fileName, '/') + 1 - fileName), fileName);
+    snprintf(inner, sizeof inner, "%.*sinner.odd", (int)(strrchr(fileName, '/') + 1 - fileName),
+             fileName);
     services->freePicture(services->loadPicture(inner, error));
     services->progressStep(1, 2);
   }
@@ -95,8 +96,9 @@ FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN11ReadImage(const char* fileName, int32_t* 
 }
 
 #if defined(HALF_WRITER) || defined(SILENT_WRITER)
-FMW_EXPORT int32_t FMW_CALL PLUGIN11WriteImage(const char* fileName, FMW_HANDLE bitmap, const char* comment,
-                                               int32_t* error, const FMW_HOST_SERVICES* services) {
+FMW_EXPORT int32_t FMW_CALL PLUGIN11WriteImage(const char* fileName, FMW_HANDLE bitmap,
+                                               const char* comment, int32_t* error,
+                                               const FMW_HOST_SERVICES* services) {
   FILE* file = fopen(fileName, "wb");
   (void)bitmap;
   (void)comment;

@@ -60,7 +60,8 @@ TEST_F(Plugins, TextsWithoutEndAreCut) {
 
 TEST_F(Plugins, OnlyModulesByNameAreLoaded) {
   const std::string module = OddFolder("GAPS_IN_LIST") + "/FMWPL_odd.so";
-  for (const char* name : {"FMWPL_odd_x64.so", ".FMWPL_odd.so", "odd.so", "FMWPL.so.1", "FMWPL_link.txt"}) {
+  for (const char* name :
+       {"FMWPL_odd_x64.so", ".FMWPL_odd.so", "odd.so", "FMWPL.so.1", "FMWPL_link.txt"}) {
     std::filesystem::copy_file(module, folder_.Path(name));
   }
   EXPECT_EQ(ScanPlugins(folder_.Path()), 0);
@@ -78,7 +79,8 @@ TEST_F(Plugins, AModuleThatIsOffIsPassedOver) {
   SetDataFolder(folder_.Path("data"));
   (void)LoadConfiguration();
   const std::string module = OddFolder("GAPS_IN_LIST") + "/FMWPL_odd.so";
-  for (const char* name : {"FMWPL_a.so", "FMWPL_b.so"}) std::filesystem::copy_file(module, folder_.Path(name));
+  for (const char* name : {"FMWPL_a.so", "FMWPL_b.so"})
+    std::filesystem::copy_file(module, folder_.Path(name));
   EXPECT_EQ(SwitchPluginModule("FMWPL_a.so", false), SaveResult::Done);
   (void)LoadConfiguration();
   ApplyPluginSettings();
@@ -121,7 +123,8 @@ TEST_F(Plugins, AFailedWriteLeavesTheDestinationAlone) {
     const char* module;
     Status status;
   };
-  for (const Row& row : {Row{"HALF_WRITER", Status::ErrorCreatingFile}, {"SILENT_WRITER", Status::ErrorWritingFile}}) {
+  for (const Row& row : {Row{"HALF_WRITER", Status::ErrorCreatingFile},
+                         {"SILENT_WRITER", Status::ErrorWritingFile}}) {
     SCOPED_TRACE(row.module);
     EnablePlugins(OddFolder(row.module));
     const std::string file = folder_.Path("x.odd");

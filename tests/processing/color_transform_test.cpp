@@ -46,18 +46,22 @@ double Encoded(double light) {
 
 // A wide color, 0x00RRGGBB, in sRGB: by the two standards' matrices, not by the library.
 std::array<double, 3> WideInSrgb(uint32_t color) {
-  const double r = std::pow((color >> 16) / 255.0, 563.0 / 256), g = std::pow((color >> 8 & 255) / 255.0, 563.0 / 256),
+  const double r = std::pow((color >> 16) / 255.0, 563.0 / 256),
+               g = std::pow((color >> 8 & 255) / 255.0, 563.0 / 256),
                b = std::pow((color & 255) / 255.0, 563.0 / 256);
-  const double x = 0.57667 * r + 0.18556 * g + 0.18823 * b, y = 0.29734 * r + 0.62736 * g + 0.07529 * b,
+  const double x = 0.57667 * r + 0.18556 * g + 0.18823 * b,
+               y = 0.29734 * r + 0.62736 * g + 0.07529 * b,
                z = 0.02703 * r + 0.07069 * g + 0.99134 * b;
-  return {Encoded(3.2404542 * x - 1.5371385 * y - 0.4985314 * z), Encoded(-0.9692660 * x + 1.8760108 * y + 0.0415560 * z),
+  return {Encoded(3.2404542 * x - 1.5371385 * y - 0.4985314 * z),
+          Encoded(-0.9692660 * x + 1.8760108 * y + 0.0415560 * z),
           Encoded(0.0556434 * x - 0.2040259 * y + 1.0572252 * z)};
 }
 
 TEST(ColorTransform, BringsWideColorsToTheScreen) {
   const ColorTransform transform(WideProfile());
   ASSERT_TRUE(transform.ChangesColors());
-  const auto picture = test::MakePicture(1031, 1021, [](int32_t x, int32_t y) { return test::Scatter(x, y) & 0xffffff; });
+  const auto picture = test::MakePicture(
+      1031, 1021, [](int32_t x, int32_t y) { return test::Scatter(x, y) & 0xffffff; });
   const std::vector<uint32_t> before = test::Colors(*picture);
   transform.Apply(picture->image);
   const std::vector<uint32_t> after = test::Colors(*picture);
@@ -72,7 +76,8 @@ TEST(ColorTransform, BringsWideColorsToTheScreen) {
   small.ColorTable()[1] = 200;
   transform.Apply(small);
   EXPECT_NEAR(small.ColorTable()[1], WideInSrgb(0x00c800)[1], 1);
-  // On a screen of the same colors nothing is to be done; on it, pictures without a profile are those of sRGB.
+  // On a screen of the same colors nothing is to be done; on it, pictures without a profile are
+  // those of sRGB.
   EXPECT_FALSE(ColorTransform(WideProfile(), WideProfile()).ChangesColors());
   PackedImage green;
   ASSERT_EQ(NewPackedImage(1, 1, nullptr, 24, green), Status::Ok);
@@ -84,10 +89,13 @@ TEST(ColorTransform, BringsWideColorsToTheScreen) {
 TEST(ColorTransform, GrayProfilesAreForGrayPictures) {
   const ColorTransform transform(GrayProfile(1));
   ASSERT_TRUE(transform.ChangesColors());
-  const auto picture = test::MakePicture(256, 1, [](int32_t x, int32_t) { return static_cast<uint32_t>(x) * 0x10101; });
+  const auto picture = test::MakePicture(
+      256, 1, [](int32_t x, int32_t) { return static_cast<uint32_t>(x) * 0x10101; });
   transform.Apply(picture->image);
-  for (int32_t x = 0; x < 256; ++x) EXPECT_NEAR(picture->image.PixelAt(x, 0) & 255, Encoded(x / 255.0), 1) << x;
-  const auto colored = test::MakePicture(2, 1, [](int32_t x, int32_t) { return x == 0 ? 0x404040u : 0x404041u; });
+  for (int32_t x = 0; x < 256; ++x)
+    EXPECT_NEAR(picture->image.PixelAt(x, 0) & 255, Encoded(x / 255.0), 1) << x;
+  const auto colored =
+      test::MakePicture(2, 1, [](int32_t x, int32_t) { return x == 0 ? 0x404040u : 0x404041u; });
   transform.Apply(colored->image);
   EXPECT_EQ(colored->image.PixelAt(0, 0), 0x404040);
 }
@@ -102,7 +110,8 @@ size_t EntryOf(const std::vector<uint8_t>& profile, const char* name) {
 }
 
 void Put32(std::vector<uint8_t>& bytes, size_t at, size_t value) {
-  for (int i = 0; i < 4; ++i) bytes[at + static_cast<size_t>(i)] = static_cast<uint8_t>(value >> (24 - 8 * i));
+  for (int i = 0; i < 4; ++i)
+    bytes[at + static_cast<size_t>(i)] = static_cast<uint8_t>(value >> (24 - 8 * i));
 }
 
 // The copyright gives way to a chain of a hundred thousand steps, which all are the same matrix.
@@ -132,8 +141,10 @@ TEST(ColorTransform, HostileProfilesDoNoHarm) {
   EXPECT_FALSE(ColorTransform(Saved(cmsCreateInkLimitingDeviceLink(cmsSigCmykData, 300))).ChangesColors());
   const std::vector<uint8_t> wide = WideProfile();
   EXPECT_TRUE(ColorTransform(WithEndlessSteps(wide)).ChangesColors());  // by its other tags, and soon
-  const auto picture = test::MakePicture(4, 4, [](int32_t x, int32_t y) { return test::Scatter(x, y) & 0xffffff; });
-  for (size_t cut = 0; cut < wide.size(); cut += 7) ColorTransform({wide.data(), cut}).Apply(picture->image);
+  const auto picture =
+      test::MakePicture(4, 4, [](int32_t x, int32_t y) { return test::Scatter(x, y) & 0xffffff; });
+  for (size_t cut = 0; cut < wide.size(); cut += 7)
+    ColorTransform({wide.data(), cut}).Apply(picture->image);
   for (size_t place = 0; place < wide.size(); place += 3) {
     std::vector<uint8_t> damaged = wide;
     damaged[place] = static_cast<uint8_t>(damaged[place] ^ (place % 2 == 0 ? 0xff : 0x55));

@@ -13,7 +13,8 @@ TEST(Flatten, BlendIsTheRoundedQuotientForEveryInput) {
     for (int32_t background = 0; background < 256; ++background) {
       for (int32_t pixel = 0; pixel < 256; ++pixel) {
         const int32_t expected = (background * (255 - alpha) + pixel * alpha + 127) / 255;
-        wrong += Blend(static_cast<uint8_t>(background), static_cast<uint8_t>(pixel), static_cast<uint8_t>(alpha)) != expected;
+        wrong += Blend(static_cast<uint8_t>(background), static_cast<uint8_t>(pixel),
+                       static_cast<uint8_t>(alpha)) != expected;
       }
     }
   }
@@ -23,10 +24,12 @@ TEST(Flatten, BlendIsTheRoundedQuotientForEveryInput) {
 TEST(Flatten, EveryPixelOfEveryWidthMeetsItsOwnAlpha) {
   for (int32_t width = 1; width < 200; width += width < 70 ? 1 : 43) {
     for (const bool own : {false, true}) {
-      const PicturePointer picture =
-          test::MakePicture(width, 3, [](int32_t x, int32_t y) { return test::Scatter(x, y) & 0xffffff; });
+      const PicturePointer picture = test::MakePicture(
+          width, 3, [](int32_t x, int32_t y) { return test::Scatter(x, y) & 0xffffff; });
       const std::vector<uint32_t> before = test::Colors(*picture);
-      const auto alphaAt = [](int32_t x, int32_t y) { return y == 0 ? 255 : static_cast<int32_t>(test::Scatter(x, -y) & 255); };
+      const auto alphaAt = [](int32_t x, int32_t y) {
+        return y == 0 ? 255 : static_cast<int32_t>(test::Scatter(x, -y) & 255);
+      };
       test::AddAlpha(*picture, alphaAt);
       picture->defaultColour = own ? 0 : 0x302010;
       picture->background = own ? 0x302010 : 0;
@@ -38,7 +41,8 @@ TEST(Flatten, EveryPixelOfEveryWidthMeetsItsOwnAlpha) {
         for (int32_t x = 0; x < width; ++x) {
           const uint32_t color = before[static_cast<size_t>(y * width + x)];
           for (int c = 0; c < 3; ++c) {
-            const auto pixel = static_cast<uint8_t>(color >> (8 * c)), background = static_cast<uint8_t>(0x102030 >> (8 * c));
+            const auto pixel = static_cast<uint8_t>(color >> (8 * c)),
+                       background = static_cast<uint8_t>(0x102030 >> (8 * c));
             ASSERT_EQ(test::ColorAt(*picture, x, y) >> (8 * c) & 255,
                       Blend(background, pixel, static_cast<uint8_t>(alphaAt(x, y))))
                 << x << ", " << y << ", width " << width;
@@ -63,12 +67,15 @@ TEST(Flatten, PalettePicturesAreBlendedToo) {
   };
   for (const Row& row : rows) {
     SCOPED_TRACE(row.name);
-    const PicturePointer picture =
-        test::MakePicture(60, 50, [&](int32_t x, int32_t y) { return (test::Scatter(x, y) % row.colors) * 0x000403u; });
+    const PicturePointer picture = test::MakePicture(60, 50, [&](int32_t x, int32_t y) {
+      return (test::Scatter(x, y) % row.colors) * 0x000403u;
+    });
     const auto alphaAt = [&](int32_t x, int32_t y) {
-      return row.lowest + (row.lowest == 0 && row.colors == 2 ? (x + y) % 2 * 255 : (x * y) % (256 - row.lowest));
+      return row.lowest + (row.lowest == 0 && row.colors == 2 ? (x + y) % 2 * 255
+                                                              : (x * y) % (256 - row.lowest));
     };
-    const PicturePointer deep = test::MakePicture(60, 50, [&](int32_t x, int32_t y) { return test::ColorAt(*picture, x, y); });
+    const PicturePointer deep = test::MakePicture(
+        60, 50, [&](int32_t x, int32_t y) { return test::ColorAt(*picture, x, y); });
     test::AddAlpha(*picture, alphaAt);
     test::AddAlpha(*deep, alphaAt);
     bool packed = false;

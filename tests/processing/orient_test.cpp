@@ -24,8 +24,9 @@ TEST(Orient, TheLetterFStandsUpright) {
   };
   for (const Row& row : rows) {
     SCOPED_TRACE(row.orientation);
-    const PicturePointer picture = MakePicture(
-        row.width, 6 / row.width, [&](int32_t x, int32_t y) { return row.stored[static_cast<size_t>(y * row.width + x)]; });
+    const PicturePointer picture = MakePicture(row.width, 6 / row.width, [&](int32_t x, int32_t y) {
+      return row.stored[static_cast<size_t>(y * row.width + x)];
+    });
     picture->metadata.dpiX = row.width;
     picture->metadata.dpiY = 6 / row.width;
     ASSERT_EQ(OrientPicture(*picture, static_cast<Orientation>(row.orientation)), Status::Ok);
@@ -38,7 +39,8 @@ TEST(Orient, TheLetterFStandsUpright) {
 
 TEST(Orient, TwoTurnsAreOne) {
   for (int32_t pair = 0; pair < 64; ++pair) {
-    const auto first = static_cast<Orientation>(1 + pair / 8), then = static_cast<Orientation>(1 + pair % 8);
+    const auto first = static_cast<Orientation>(1 + pair / 8),
+               then = static_cast<Orientation>(1 + pair % 8);
     const auto number = [](int32_t x, int32_t y) { return static_cast<uint32_t>(3 * y + x); };
     const PicturePointer twice = MakePicture(3, 2, number), once = MakePicture(3, 2, number);
     ASSERT_EQ(OrientPicture(*twice, first), Status::Ok);
@@ -52,19 +54,22 @@ TEST(Orient, TwoTurnsAreOne) {
 TEST(Orient, UndoneByItsInverseAtEveryDepth) {
   constexpr int32_t kInverse[] = {0, 1, 2, 3, 4, 5, 8, 7, 6};
   for (const int32_t bits : {1, 4, 8, 24}) {
-    for (const auto& [width, height] : {std::pair{1, 1}, {1, 70}, {70, 1}, {33, 65}, {100, 31}, {150, 260}}) {
+    for (const auto& [width, height] :
+         {std::pair{1, 1}, {1, 70}, {70, 1}, {33, 65}, {100, 31}, {150, 260}}) {
       for (int32_t orientation = 1; orientation <= 8; ++orientation) {
         SCOPED_TRACE(testing::Message() << bits << " bits, " << width << " x " << height << ", " << orientation);
         const uint32_t colors = bits == 24 ? 0x1000000 : 1u << bits;
         const PicturePointer picture = MakePicture(width, height, [&](int32_t x, int32_t y) {
           return test::Scatter(x, y) % colors * (bits == 24 ? 1 : 0x010305) & 0xffffff;
         });
-        const PicturePointer deep = MakePicture(width, height, [&](int32_t x, int32_t y) { return test::ColorAt(*picture, x, y); });
+        const PicturePointer deep = MakePicture(
+            width, height, [&](int32_t x, int32_t y) { return test::ColorAt(*picture, x, y); });
         bool packed = false;
         ASSERT_EQ(PackFewColors(*picture, bits, packed), Status::Ok);
         test::AddAlpha(*picture, [](int32_t x, int32_t y) { return (x * 3 + y * 7) & 255; });
         const std::vector<uint32_t> before = Colors(*picture);
-        const std::vector<uint8_t> table(picture->image.ColorTable().begin(), picture->image.ColorTable().end());
+        const std::vector<uint8_t> table(picture->image.ColorTable().begin(),
+                                         picture->image.ColorTable().end());
         ASSERT_EQ(OrientPicture(*picture, static_cast<Orientation>(orientation)), Status::Ok);
         ASSERT_EQ(OrientPicture(*deep, static_cast<Orientation>(orientation)), Status::Ok);
         EXPECT_EQ(Colors(*picture), Colors(*deep));
@@ -74,7 +79,8 @@ TEST(Orient, UndoneByItsInverseAtEveryDepth) {
         ASSERT_EQ(OrientPicture(*picture, static_cast<Orientation>(kInverse[orientation])), Status::Ok);
         EXPECT_EQ(Colors(*picture), before);
         for (int32_t y = 0; y < height; ++y) {
-          for (int32_t x = 0; x < width; ++x) ASSERT_EQ(picture->alpha.PixelAt(x, y), (x * 3 + y * 7) & 255);
+          for (int32_t x = 0; x < width; ++x)
+            ASSERT_EQ(picture->alpha.PixelAt(x, y), (x * 3 + y * 7) & 255);
         }
       }
     }

@@ -12,7 +12,8 @@
 namespace fotomill::test {
 
 // A 24-bit picture whose pixel at column x, row y from the top is colorAt(x, y), 0x00RRGGBB.
-inline PicturePointer MakePicture(int32_t width, int32_t height, const std::function<uint32_t(int32_t, int32_t)>& colorAt) {
+inline PicturePointer MakePicture(int32_t width, int32_t height,
+                                  const std::function<uint32_t(int32_t, int32_t)>& colorAt) {
   PicturePointer picture = NewPictureRecord();
   EXPECT_EQ(NewPackedImage(width, height, nullptr, 24, picture->image), Status::Ok);
   picture->width = width;
@@ -27,7 +28,8 @@ inline PicturePointer MakePicture(int32_t width, int32_t height, const std::func
   return picture;
 }
 
-inline void AddAlpha(PictureRecord& picture, const std::function<int32_t(int32_t, int32_t)>& alphaAt) {
+inline void AddAlpha(PictureRecord& picture,
+                     const std::function<int32_t(int32_t, int32_t)>& alphaAt) {
   EXPECT_EQ(NewAlphaPlane(picture.image.Width(), picture.image.Height(), picture.alpha), Status::Ok);
   for (int32_t y = 0; y < picture.image.Height(); ++y) {
     for (int32_t x = 0; x < picture.image.Width(); ++x) {

@@ -20,7 +20,8 @@ TEST(PixelRows, TakeApartAndPutTogether) {
   for (size_t count = 0; count < 100; ++count) {
     SCOPED_TRACE(count);
     const Bytes colors = RandomBytes(3 * count, 1), four = RandomBytes(4 * count, 2);
-    Bytes blue(count), green(count), red(count), alpha(count), merged(3 * count), three(3 * count), back(4 * count);
+    Bytes blue(count), green(count), red(count), alpha(count), merged(3 * count), three(3 * count),
+        back(4 * count);
 
     SplitColors(colors.data(), count, blue.data(), green.data(), red.data());
     EXPECT_EQ(blue, Every(3, 0, colors));

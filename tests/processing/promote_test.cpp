@@ -11,8 +11,8 @@ using test::MakePicture;
 // `count` colors, all different, in a picture of 37 x 23 pixels.
 PicturePointer PictureOfColors(uint32_t count) {
   return MakePicture(37, 23, [count](int32_t x, int32_t y) {
-    const uint32_t i =
-        static_cast<uint32_t>(y * 37 + x) < count ? static_cast<uint32_t>(y * 37 + x) : test::Scatter(x, y) % count;
+    const uint32_t i = static_cast<uint32_t>(y * 37 + x) < count ? static_cast<uint32_t>(y * 37 + x)
+                                                                 : test::Scatter(x, y) % count;
     return i * 0x010307u & 0xffffff;
   });
 }
@@ -63,14 +63,16 @@ TEST(Promote, RowsEndWithTheirLastPixel) {
       for (size_t i = 0; i < palette.size(); ++i) palette[i] = static_cast<uint8_t>(7 * i + 1);
       PackedImage image, promoted;
       ASSERT_EQ(NewPackedImage(width, 3, &palette, bits, image), Status::Ok);
-      for (size_t i = 0; i < image.Rows().size(); ++i) image.Rows()[i] = static_cast<uint8_t>(91 * i + 5);
+      for (size_t i = 0; i < image.Rows().size(); ++i)
+        image.Rows()[i] = static_cast<uint8_t>(91 * i + 5);
       ASSERT_EQ(PromoteImage(image, 24, promoted), Status::Ok);
       for (int32_t y = 0; y < 3; ++y) {
         for (int32_t x = 0; x < width; ++x) {
           const uint8_t* color = palette.data() + 3 * image.PixelAt(x, y);
           EXPECT_EQ(promoted.PixelAt(x, y), color[0] << 16 | color[1] << 8 | color[2]);
         }
-        for (size_t i = 3 * static_cast<size_t>(width); i < promoted.Stride(); ++i) EXPECT_EQ(promoted.Row(y)[i], 0);
+        for (size_t i = 3 * static_cast<size_t>(width); i < promoted.Stride(); ++i)
+          EXPECT_EQ(promoted.Row(y)[i], 0);
       }
     }
   }

@@ -18,7 +18,8 @@ uint32_t Gray(int32_t level) { return static_cast<uint32_t>(level) * 0x010101u; 
 
 PicturePointer Sweep(int32_t width, int32_t height) {
   return MakePicture(width, height, [=](int32_t x, int32_t y) {
-    return static_cast<uint32_t>(x * 255 / width << 16 | y * 255 / height << 8 | (x + y) * 255 / (width + height));
+    return static_cast<uint32_t>(x * 255 / width << 16 | y * 255 / height << 8 |
+                                 (x + y) * 255 / (width + height));
   });
 }
 
@@ -52,8 +53,9 @@ TEST(Reduce, DepthFollowsTheAim) {
 TEST(Reduce, FewColorsAreKeptExactly) {
   for (const int32_t bits : {1, 4, 8}) {
     SCOPED_TRACE(bits);
-    const PicturePointer picture =
-        MakePicture(50, 40, [bits](int32_t x, int32_t y) { return test::Scatter(x, y) % (1u << bits) * 0x050301u; });
+    const PicturePointer picture = MakePicture(50, 40, [bits](int32_t x, int32_t y) {
+      return test::Scatter(x, y) % (1u << bits) * 0x050301u;
+    });
     const std::vector<uint32_t> before = Colors(*picture);
     ASSERT_EQ(ReduceColors(*picture, bits, {}), Status::Ok);
     EXPECT_EQ(picture->bitsPerPixel, bits);
@@ -61,15 +63,17 @@ TEST(Reduce, FewColorsAreKeptExactly) {
   }
 }
 
-// Dithering must keep the mean of any area, at every level of gray and in both directions of travel.
+// Dithering must keep the mean of any area, at every level of gray and in both directions of
+// travel.
 TEST(Reduce, DitheredGraysKeepTheirMean) {
   for (const Dither dither : {Dither::Ordered, Dither::FloydSteinberg}) {
     for (const bool serpentine : {false, true}) {
       for (int32_t level = 0; level <= 255; level += 5) {
         SCOPED_TRACE(testing::Message() << level << ", dither " << static_cast<int32_t>(dither));
         // Two pixels of other colors keep the picture from being packed exactly.
-        const PicturePointer picture =
-            MakePicture(128, 128, [level](int32_t x, int32_t y) { return y == 0 && x < 2 ? Gray(100 + x) : Gray(level); });
+        const PicturePointer picture = MakePicture(128, 128, [level](int32_t x, int32_t y) {
+          return y == 0 && x < 2 ? Gray(100 + x) : Gray(level);
+        });
         ReduceOptions options;
         options.monoDither = dither;
         options.serpentine = serpentine;
@@ -109,7 +113,8 @@ TEST(Reduce, ThresholdPartsDarkFromBright) {
 }
 
 TEST(Reduce, AlphaGoesToTheBackgroundFirst) {
-  const PicturePointer picture = MakePicture(20, 20, [](int32_t x, int32_t y) { return test::Scatter(x, y) & 0xffffff; });
+  const PicturePointer picture =
+      MakePicture(20, 20, [](int32_t x, int32_t y) { return test::Scatter(x, y) & 0xffffff; });
   test::AddAlpha(*picture, [](int32_t, int32_t) { return 0; });
   picture->defaultColour = 0x102030;  // blue, green, red
   ASSERT_EQ(ReduceColors(*picture, 8, {}), Status::Ok);
@@ -122,12 +127,14 @@ double Likeness(const std::vector<uint32_t>& a, const std::vector<uint32_t>& b) 
   double error = 0;
   for (size_t i = 0; i < a.size(); ++i) {
     for (int c = 0; c < 3; ++c)
-      error += std::pow(static_cast<int>(a[i] >> (8 * c) & 255) - static_cast<int>(b[i] >> (8 * c) & 255), 2);
+      error += std::pow(
+          static_cast<int>(a[i] >> (8 * c) & 255) - static_cast<int>(b[i] >> (8 * c) & 255), 2);
   }
   return 10 * std::log10(255.0 * 255.0 * 3 * static_cast<double>(a.size()) / error);
 }
 
-// Limits a little below what was reached when they were set: the palette's quality must not slip unnoticed.
+// Limits a little below what was reached when they were set: the palette's quality must not slip
+// unnoticed.
 TEST(Reduce, PalettesStayTrueToThePicture) {
   const auto waves = [](int32_t x, int32_t y) {
     const auto level = [](double t) { return static_cast<uint32_t>(127.5 + 120 * std::sin(t)); };
@@ -136,7 +143,8 @@ TEST(Reduce, PalettesStayTrueToThePicture) {
   // Two clusters of like colors, far apart.
   const auto clusters = [](int32_t x, int32_t y) {
     const uint32_t noise = test::Scatter(x, y);
-    return (x < 100 ? 0x181410u : 0xd8d0e0u) + ((noise & 7) << 16 | (noise >> 3 & 7) << 8 | (noise >> 6 & 7));
+    return (x < 100 ? 0x181410u : 0xd8d0e0u) +
+           ((noise & 7) << 16 | (noise >> 3 & 7) << 8 | (noise >> 6 & 7));
   };
   struct Row {
     const char* name;
@@ -173,18 +181,21 @@ TEST(Reduce, NearestColorIsNearest) {
       SCOPED_TRACE(testing::Message() << count << " colors within " << range);
       Palette palette{};
       for (uint8_t& level : palette)
-        level = static_cast<uint8_t>((256 - range) / 2 + static_cast<int32_t>(random() % static_cast<uint32_t>(range)));
+        level = static_cast<uint8_t>((256 - range) / 2 +
+                                     static_cast<int32_t>(random() % static_cast<uint32_t>(range)));
       NearestColor nearest;
       ASSERT_EQ(nearest.Open(true), Status::Ok);
       nearest.SetColors(PointsOf(palette, count));
       const auto distance = [&](int32_t i, const int32_t(&bgr)[3]) {
         int32_t sum = 0;
         for (int c = 0; c < 3; ++c)
-          sum += kChannelWeight[c] * static_cast<int32_t>(std::pow(palette[static_cast<size_t>(3 * i + 2 - c)] - bgr[c], 2));
+          sum += kChannelWeight[c] * static_cast<int32_t>(std::pow(
+                                         palette[static_cast<size_t>(3 * i + 2 - c)] - bgr[c], 2));
         return sum;
       };
       for (int k = 0; k < 4000; ++k) {
-        const int32_t bgr[3] = {static_cast<int32_t>(random() & 255), static_cast<int32_t>(random() & 255),
+        const int32_t bgr[3] = {static_cast<int32_t>(random() & 255),
+                                static_cast<int32_t>(random() & 255),
                                 static_cast<int32_t>(random() & 255)};
         int32_t least = INT32_MAX;
         for (int32_t i = 0; i < count; ++i) least = std::min(least, distance(i, bgr));
@@ -223,7 +234,8 @@ TEST(Reduce, AdjustmentsMoveTheMean) {
                          {"all gray", 0, -100, 128},
                          {"doubled", 0, 100, 31.75}}) {
     SCOPED_TRACE(row.name);
-    const PicturePointer picture = MakePicture(256, 64, [](int32_t x, int32_t) { return Gray(x / 2); });
+    const PicturePointer picture =
+        MakePicture(256, 64, [](int32_t x, int32_t) { return Gray(x / 2); });
     ReduceOptions options;
     options.brightness = row.brightness;
     options.contrast = row.contrast;

@@ -20,7 +20,8 @@ using test::Colors;
 using test::MakePicture;
 using test::Scatter;
 
-constexpr ScaleFilter kFilters[] = {ScaleFilter::Lanczos, ScaleFilter::Bicubic, ScaleFilter::Bilinear, ScaleFilter::Nearest};
+constexpr ScaleFilter kFilters[] = {ScaleFilter::Lanczos, ScaleFilter::Bicubic,
+                                    ScaleFilter::Bilinear, ScaleFilter::Nearest};
 
 TEST(Scale, Sizes) {
   struct Row {
@@ -65,16 +66,21 @@ TEST(Scale, KeysSelectTheFilterThatTheirListNames) {
   EXPECT_EQ(ScaleFilterFromKey(INT32_MAX), ScaleFilter::Nearest);
 }
 
-// The value of every pixel by the filter's definition, in floating point, pixel by pixel in both directions at once.
+// The value of every pixel by the filter's definition, in floating point, pixel by pixel in both
+// directions at once.
 struct Reference {
   ScaleFilter filter;
   double Shape(double x) const {
     x = std::abs(x);
-    const auto sinc = [](double t) { return t == 0 ? 1.0 : std::sin(std::numbers::pi * t) / (std::numbers::pi * t); };
+    const auto sinc = [](double t) {
+      return t == 0 ? 1.0 : std::sin(std::numbers::pi * t) / (std::numbers::pi * t);
+    };
     switch (filter) {
       case ScaleFilter::Bilinear: return x < 1 ? 1 - x : 0;
       case ScaleFilter::Bicubic:
-        return x < 1 ? 1.5 * x * x * x - 2.5 * x * x + 1 : x < 2 ? -0.5 * x * x * x + 2.5 * x * x - 4 * x + 2 : 0;
+        return x < 1   ? 1.5 * x * x * x - 2.5 * x * x + 1
+               : x < 2 ? -0.5 * x * x * x + 2.5 * x * x - 4 * x + 2
+                       : 0;
       default: return x < 3 ? sinc(x) * sinc(x / 3) : 0;
     }
   }
@@ -88,7 +94,8 @@ struct Reference {
     for (double& w : weights) w /= sum;
     return weights;
   }
-  // Blue, green, red and alpha of every pixel of the result, row by row; colors already divided by the alpha.
+  // Blue, green, red and alpha of every pixel of the result, row by row; colors already divided by
+  // the alpha.
   std::vector<std::array<double, 4>> Scale(const PictureRecord& picture, Size size) const {
     const int32_t width = picture.image.Width(), height = picture.image.Height();
     std::vector<std::array<double, 4>> narrow(static_cast<size_t>(size.width * height)),
@@ -96,7 +103,8 @@ struct Reference {
     for (int32_t x = 0; x < size.width; ++x) {
       const auto weights = Weights(x, size.width, width);
       for (int32_t i = 0; i < width * height; ++i) {
-        const double alpha = picture.alpha.Empty() ? 255 : picture.alpha.PixelAt(i % width, i / width);
+        const double alpha =
+            picture.alpha.Empty() ? 255 : picture.alpha.PixelAt(i % width, i / width);
         const double weight = weights[static_cast<size_t>(i % width)] * alpha / 255;
         auto& sum = narrow[static_cast<size_t>(i / width * size.width + x)];
         const uint32_t color = test::ColorAt(picture, i % width, i / width);
@@ -108,11 +116,14 @@ struct Reference {
       const auto weights = Weights(y, size.height, height);
       for (int32_t i = 0; i < size.width * height; ++i) {
         auto& sum = scaled[static_cast<size_t>(y * size.width + i % size.width)];
-        for (size_t c = 0; c < 4; ++c) sum[c] += weights[static_cast<size_t>(i / size.width)] * narrow[static_cast<size_t>(i)][c];
+        for (size_t c = 0; c < 4; ++c)
+          sum[c] +=
+              weights[static_cast<size_t>(i / size.width)] * narrow[static_cast<size_t>(i)][c];
       }
     }
     for (auto& sum : scaled) {
-      for (size_t c = 0; c < 3; ++c) sum[c] = std::clamp(sum[3] <= 0 ? 0.0 : sum[c] * 255 / sum[3], 0.0, 255.0);
+      for (size_t c = 0; c < 3; ++c)
+        sum[c] = std::clamp(sum[3] <= 0 ? 0.0 : sum[c] * 255 / sum[3], 0.0, 255.0);
       sum[3] = std::clamp(sum[3], 0.0, 255.0);
     }
     return scaled;
@@ -136,12 +147,16 @@ TEST(Scale, FollowsTheFiltersDefinition) {
       {"same size", {33, 20}, {33, 20}, false},
   };
   for (const Row& row : rows) {
-    for (const ScaleFilter filter : {ScaleFilter::Lanczos, ScaleFilter::Bicubic, ScaleFilter::Bilinear}) {
+    for (const ScaleFilter filter :
+         {ScaleFilter::Lanczos, ScaleFilter::Bicubic, ScaleFilter::Bilinear}) {
       SCOPED_TRACE(testing::Message() << row.name << ", filter " << static_cast<int32_t>(filter));
       const PicturePointer picture =
-          MakePicture(row.source.width, row.source.height, [](int32_t x, int32_t y) { return Scatter(x, y) & 0xffffff; });
+          MakePicture(row.source.width, row.source.height,
+                      [](int32_t x, int32_t y) { return Scatter(x, y) & 0xffffff; });
       if (row.alpha) {
-        test::AddAlpha(*picture, [](int32_t x, int32_t y) { return static_cast<int32_t>(100 + Scatter(x + 99, y) % 156); });
+        test::AddAlpha(*picture, [](int32_t x, int32_t y) {
+          return static_cast<int32_t>(100 + Scatter(x + 99, y) % 156);
+        });
       }
       PackedImage image, alpha;
       ASSERT_EQ(ScaleFiltered(picture->image, picture->alpha, row.size, filter, image, alpha), Status::Ok);
@@ -162,18 +177,23 @@ TEST(Scale, FollowsTheFiltersDefinition) {
   }
 }
 
-constexpr Size kOddSizes[] = {{1, 1}, {1, 7}, {9, 1}, {2, 300}, {300, 2}, {21, 22}, {64, 64}, {3, 1000}};
+constexpr Size kOddSizes[] = {{1, 1},   {1, 7},   {9, 1},   {2, 300},
+                              {300, 2}, {21, 22}, {64, 64}, {3, 1000}};
 
 TEST(Scale, OneColorStaysThatColorAtEverySize) {
   for (const uint32_t color : {0x000000u, 0xffffffu, 0x01fe80u}) {
     for (const bool alpha : {false, true}) {
       for (const Size from : kOddSizes) {
-        const PicturePointer picture = MakePicture(from.width, from.height, [=](int32_t, int32_t) { return color; });
-        if (alpha) test::AddAlpha(*picture, [](int32_t x, int32_t y) { return (x + y) % 2 == 0 ? 255 : 128; });
+        const PicturePointer picture =
+            MakePicture(from.width, from.height, [=](int32_t, int32_t) { return color; });
+        if (alpha)
+          test::AddAlpha(*picture,
+                         [](int32_t x, int32_t y) { return (x + y) % 2 == 0 ? 255 : 128; });
         for (const Size to : kOddSizes) {
           for (const ScaleFilter filter : kFilters) {
-            SCOPED_TRACE(testing::Message() << from.width << " x " << from.height << " to " << to.width << " x " << to.height
-                                            << ", filter " << static_cast<int32_t>(filter) << ", alpha " << alpha);
+            SCOPED_TRACE(testing::Message() << from.width << " x " << from.height << " to "
+                                            << to.width << " x " << to.height << ", filter "
+                                            << static_cast<int32_t>(filter) << ", alpha " << alpha);
             PackedImage image, plane;
             ASSERT_EQ(ScaleFiltered(picture->image, picture->alpha, to, filter, image, plane), Status::Ok);
             for (int32_t y = 0; y < to.height; ++y) {
@@ -191,20 +211,24 @@ TEST(Scale, OneColorStaysThatColorAtEverySize) {
 }
 
 TEST(Scale, MirrorsStayMirrors) {
-  for (const auto& [width, size] : {std::pair{40, Size{13, 9}}, {41, Size{100, 70}}, {400, Size{31, 20}}, {7, Size{8, 3}}}) {
+  for (const auto& [width, size] :
+       {std::pair{40, Size{13, 9}}, {41, Size{100, 70}}, {400, Size{31, 20}}, {7, Size{8, 3}}}) {
     for (const ScaleFilter filter : kFilters) {
       for (const Orientation mirror : {Orientation::MirrorAcross, Orientation::MirrorDown}) {
         SCOPED_TRACE(testing::Message() << width << " to " << size.width << ", filter " << static_cast<int32_t>(filter));
         // An even picture has no middle pixel that Nearest must break a tie for.
-        const PicturePointer picture = MakePicture(
-            width, 21, [&](int32_t x, int32_t y) { return Scatter(std::min(x, width - 1 - x), std::min(y, 20 - y)) & 0xffffff; });
+        const PicturePointer picture = MakePicture(width, 21, [&](int32_t x, int32_t y) {
+          return Scatter(std::min(x, width - 1 - x), std::min(y, 20 - y)) & 0xffffff;
+        });
         ASSERT_EQ(ScalePicture(*picture, size, filter), Status::Ok);
         std::vector<uint32_t> before = Colors(*picture);
         ASSERT_EQ(OrientPicture(*picture, mirror), Status::Ok);
         const std::vector<uint32_t> after = Colors(*picture);
         for (size_t i = 0; i < before.size(); ++i) {
-          const auto x = static_cast<int32_t>(i) % size.width, y = static_cast<int32_t>(i) / size.width;
-          if (2 * x + 1 == size.width || 2 * y + 1 == size.height) continue;  // may round its own way
+          const auto x = static_cast<int32_t>(i) % size.width,
+                     y = static_cast<int32_t>(i) / size.width;
+          // may round its own way
+          if (2 * x + 1 == size.width || 2 * y + 1 == size.height) continue;
           if (filter == ScaleFilter::Nearest && width % 2 == 0) continue;
           ASSERT_EQ(before[i], after[i]) << x << ", " << y;
         }
@@ -213,12 +237,14 @@ TEST(Scale, MirrorsStayMirrors) {
   }
 }
 
-// A slope must come out as the same slope: half a pixel's shift would show as a constant difference.
+// A slope must come out as the same slope: half a pixel's shift would show as a constant
+// difference.
 TEST(Scale, NothingMovesAside) {
   for (const int32_t width : {32, 100, 255, 700}) {
     for (const ScaleFilter filter : kFilters) {
       SCOPED_TRACE(testing::Message() << "to " << width << ", filter " << static_cast<int32_t>(filter));
-      const PicturePointer picture = MakePicture(1020, 40, [](int32_t x, int32_t) { return static_cast<uint32_t>(x / 4); });
+      const PicturePointer picture =
+          MakePicture(1020, 40, [](int32_t x, int32_t) { return static_cast<uint32_t>(x / 4); });
       PackedImage image, plane;
       ASSERT_EQ(ScaleFiltered(picture->image, picture->alpha, {width, 40}, filter, image, plane), Status::Ok);
       double difference = 0;
@@ -233,8 +259,11 @@ TEST(Scale, TransparentColorsLeaveNoFringe) {
   for (const Size size : {Size{30, 30}, {200, 150}, {4, 4}, {61, 3}}) {
     for (const ScaleFilter filter : kFilters) {
       SCOPED_TRACE(testing::Message() << size.width << " x " << size.height << ", filter " << static_cast<int32_t>(filter));
-      const auto inside = [](int32_t x, int32_t y) { return (x - 30) * (x - 30) + (y - 30) * (y - 30) < 400; };
-      const PicturePointer picture = MakePicture(61, 61, [&](int32_t x, int32_t y) { return inside(x, y) ? 0xf0e0d0 : 0u; });
+      const auto inside = [](int32_t x, int32_t y) {
+        return (x - 30) * (x - 30) + (y - 30) * (y - 30) < 400;
+      };
+      const PicturePointer picture =
+          MakePicture(61, 61, [&](int32_t x, int32_t y) { return inside(x, y) ? 0xf0e0d0 : 0u; });
       test::AddAlpha(*picture, [&](int32_t x, int32_t y) { return inside(x, y) ? 255 : 0; });
       ASSERT_EQ(ScalePicture(*picture, size, filter), Status::Ok);
       int32_t seen = 0;
@@ -262,7 +291,8 @@ TEST(Scale, GreatReductionsStayTrueToTheFilter) {
     return wave(x / 31.0 + y / 57.0) | wave(y / 23.0) << 8 | (Scatter(x / 9, y / 9) & 0xff0000);
   };
   const PicturePointer picture = MakePicture(531, 377, smooth);
-  for (const ScaleFilter filter : {ScaleFilter::Lanczos, ScaleFilter::Bicubic, ScaleFilter::Bilinear}) {
+  for (const ScaleFilter filter :
+       {ScaleFilter::Lanczos, ScaleFilter::Bicubic, ScaleFilter::Bilinear}) {
     SCOPED_TRACE(static_cast<int32_t>(filter));
     const Size size{37, 26};
     PackedImage image, plane;
@@ -272,7 +302,8 @@ TEST(Scale, GreatReductionsStayTrueToTheFilter) {
     for (int32_t y = 0; y < size.height; ++y) {
       for (int32_t x = 0; x < size.width; ++x) {
         const auto& expected = reference[static_cast<size_t>(y * size.width + x)];
-        for (size_t c = 0; c < 3; ++c) error += std::pow((image.PixelAt(x, y) >> (8 * c) & 255) - expected[c], 2);
+        for (size_t c = 0; c < 3; ++c)
+          error += std::pow((image.PixelAt(x, y) >> (8 * c) & 255) - expected[c], 2);
       }
     }
     EXPECT_GT(10 * std::log10(255.0 * 255.0 * 3 * size.width * size.height / error), 45);
@@ -292,13 +323,17 @@ TEST(Scale, ThreadsAndPointsAndPalettes) {
                          {{30, 20}, {11, 40}}}) {
     for (const int32_t bits : {1, 4, 8}) {
       for (const ScaleFilter filter : kFilters) {
-        SCOPED_TRACE(testing::Message() << row.source.width << " x " << row.source.height << " to " << row.size.width << " x "
-                                        << row.size.height << ", " << bits << " bits, filter " << static_cast<int32_t>(filter));
-        const PicturePointer picture = MakePicture(row.source.width, row.source.height, [bits](int32_t x, int32_t y) {
-          return Scatter(x, y) % (1u << bits) * (0xffffffu / ((1u << bits) - 1));
-        });
+        SCOPED_TRACE(testing::Message()
+                     << row.source.width << " x " << row.source.height << " to " << row.size.width
+                     << " x " << row.size.height << ", " << bits << " bits, filter "
+                     << static_cast<int32_t>(filter));
+        const PicturePointer picture =
+            MakePicture(row.source.width, row.source.height, [bits](int32_t x, int32_t y) {
+              return Scatter(x, y) % (1u << bits) * (0xffffffu / ((1u << bits) - 1));
+            });
         const PicturePointer deep =
-            MakePicture(row.source.width, row.source.height, [&](int32_t x, int32_t y) { return test::ColorAt(*picture, x, y); });
+            MakePicture(row.source.width, row.source.height,
+                        [&](int32_t x, int32_t y) { return test::ColorAt(*picture, x, y); });
         bool packed = false;
         ASSERT_EQ(PackFewColors(*picture, 8, packed), Status::Ok);
         ASSERT_EQ(ScalePicture(*picture, row.size, filter), Status::Ok);
@@ -354,7 +389,8 @@ TEST(Scale, NoMemoryLeavesThePictureWhole) {
   for (const bool alpha : {false, true}) {
     for (const ScaleFilter filter : kFilters) {
       SCOPED_TRACE(testing::Message() << "filter " << static_cast<int32_t>(filter) << ", alpha " << alpha);
-      const PicturePointer picture = MakePicture(50, 40, [](int32_t x, int32_t y) { return Scatter(x, y) & 0xffffff; });
+      const PicturePointer picture =
+          MakePicture(50, 40, [](int32_t x, int32_t y) { return Scatter(x, y) & 0xffffff; });
       if (alpha) {
         test::AddAlpha(*picture, [](int32_t x, int32_t) { return x; });
       }

@@ -8,7 +8,8 @@ namespace {
 TEST(TableRow, IsTheSameOnEveryProcessor) {
   uint8_t table[256];
   for (int32_t i = 0; i < 256; ++i) table[i] = static_cast<uint8_t>(Scatter(i, 7));
-  for (const size_t count : {size_t{0}, size_t{1}, size_t{63}, size_t{64}, size_t{65}, size_t{1000}}) {
+  for (const size_t count :
+       {size_t{0}, size_t{1}, size_t{63}, size_t{64}, size_t{65}, size_t{1000}}) {
     SCOPED_TRACE(count);
     std::vector<uint8_t> here(count + 8);  // the last eight are not to be touched
     for (size_t i = 0; i < here.size(); ++i) here[i] = static_cast<uint8_t>(i * 13);

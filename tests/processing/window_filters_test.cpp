@@ -52,7 +52,10 @@ std::vector<uint32_t> Expected(const Filter& filter, const PictureRecord& pictur
         Levels levels;
         for (int32_t j = y - radius; j <= y + radius; ++j) {
           for (int32_t i = x - radius; i <= x + radius; ++i) {
-            levels.push_back(ColorAt(picture, std::clamp(i, 0, width - 1), std::clamp(j, 0, height - 1)) >> shift & 255);
+            levels.push_back(
+                ColorAt(picture, std::clamp(i, 0, width - 1), std::clamp(j, 0, height - 1)) >>
+                    shift &
+                255);
           }
         }
         color |= filter.of(levels) << shift;
@@ -67,11 +70,13 @@ TEST(WindowFilters, AreWhatTheyAreCalled) {
   struct Row {
     int32_t width, height, radius;
   };
-  constexpr Row kRows[] = {{1, 1, 3}, {2, 1, 0}, {7, 5, 1}, {40, 3, 2}, {3, 90, 4}, {33, 21, 12}, {300, 70, 1}, {3, 2, 127}};
+  constexpr Row kRows[] = {{1, 1, 3},  {2, 1, 0},    {7, 5, 1},    {40, 3, 2},
+                           {3, 90, 4}, {33, 21, 12}, {300, 70, 1}, {3, 2, 127}};
   for (const Row& row : kRows) {
     for (const bool noise : {true, false}) {
       const auto colorAt = [&](int32_t x, int32_t y) {
-        return noise ? Scatter(x, y) & 0xffffff : static_cast<uint32_t>(x / 9 * 0x160B05 + y / 4 * 0x010203) & 0xffffff;
+        return noise ? Scatter(x, y) & 0xffffff
+                     : static_cast<uint32_t>(x / 9 * 0x160B05 + y / 4 * 0x010203) & 0xffffff;
       };
       for (const Filter& filter : kFilters) {
         SCOPED_TRACE(std::string(filter.name) + " " + std::to_string(row.width) + " " + std::to_string(row.radius));
@@ -89,7 +94,8 @@ TEST(WindowFilters, ColorsCountByTheirAlpha) {
   for (const Filter& filter : kFilters) {
     SCOPED_TRACE(filter.name);
     const auto isSeen = [](int32_t x) { return x < 10; };
-    const PicturePointer picture = MakePicture(20, 8, [&](int32_t x, int32_t) { return isSeen(x) ? 0x306090u : 0xffffffu; });
+    const PicturePointer picture =
+        MakePicture(20, 8, [&](int32_t x, int32_t) { return isSeen(x) ? 0x306090u : 0xffffffu; });
     AddAlpha(*picture, [&](int32_t x, int32_t) { return isSeen(x) ? 200 : 0; });
     ASSERT_EQ(filter.apply(*picture, 3, {}), Status::Ok);
     for (int32_t x = 0; x < 20; ++x) {
@@ -112,7 +118,8 @@ TEST(WindowFilters, MediansAreTheSameOnEveryProcessor) {
     for (size_t i = 0; i < bytes.size(); ++i) {
       const size_t column = i % kColumns, level = window == 255 ? bytes[i] & 31u : bytes[i];
       ++groups[column * kCountsInGroup + level / kCountsInGroup];
-      ++levels[level / kCountsInGroup * groups.size() + column * kCountsInGroup + level % kCountsInGroup];
+      ++levels[level / kCountsInGroup * groups.size() + column * kCountsInGroup +
+               level % kCountsInGroup];
     }
     const ColumnCounts columns{groups.data(), levels.data(), kCountsInGroup, groups.size()};
     const auto count = static_cast<int32_t>(kColumns) - window + 1;

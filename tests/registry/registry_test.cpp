@@ -21,7 +21,8 @@ TEST(FindFormat, FirstRowThatMatchesWins) {
   const struct {
     const char* name;
     int32_t row;
-    int32_t rowWithPlugins;  // with AllowPluginFormatOverride, which leaves out rows that are switched off
+    // with AllowPluginFormatOverride, which leaves out rows that are switched off
+    int32_t rowWithPlugins;
   } rows[] = {
       {"a.bmp", 2, 2},
       {"A.BMP", 2, 2},
@@ -67,11 +68,14 @@ TEST(FindFormat, FirstRowThatMatchesWins) {
 
 TEST(FindFormat, PlugInsAreAskedLastAndListedLast) {
   const size_t filter = OpenFileFilter().size(), destinations = DestinationExtensions().size();
-  constexpr PluginSource kSource{
-      [](std::string_view name, int32_t parameter) { return name == "x.heic" && parameter == 5 ? kSpareRow : kNoFormat; },
-      [] {
-        return std::vector<PluginFormatFacts>{{"HEIC", "", 24, false}, {"QOI", "Quite OK", 24, true}};
-      }};
+  constexpr PluginSource kSource{[](std::string_view name, int32_t parameter) {
+                                   return name == "x.heic" && parameter == 5 ? kSpareRow
+                                                                             : kNoFormat;
+                                 },
+                                 [] {
+                                   return std::vector<PluginFormatFacts>{
+                                       {"HEIC", "", 24, false}, {"QOI", "Quite OK", 24, true}};
+                                 }};
   InstallPluginSource(&kSource);
   EXPECT_EQ(FindFormatByName("x.heic", 5), kSpareRow);
   EXPECT_EQ(FindFormatByName("x.heic", 4), kNoFormat);
@@ -153,9 +157,10 @@ TEST(WritePicture, RefusesInOrder) {
 
 TEST(WritePicture, KeepsTheSourceNameAndFlattensWhereAlphaCannotGo) {
   const TemporaryFolder folder;
-  // Blue, green, red of 100, 150, 200 at alpha 0, 1, 128 and 255, onto a background of its own: red 10, green 20,
-  // blue 30.
-  const PicturePointer picture = MakePicture(4, 1, 24, {{100, 150, 200, 100, 150, 200, 100, 150, 200, 100, 150, 200}});
+  // Blue, green, red of 100, 150, 200 at alpha 0, 1, 128 and 255, onto a background of its own: red
+  // 10, green 20, blue 30.
+  const PicturePointer picture =
+      MakePicture(4, 1, 24, {{100, 150, 200, 100, 150, 200, 100, 150, 200, 100, 150, 200}});
   ASSERT_EQ(NewAlphaPlane(4, 1, picture->alpha), Status::Ok);
   const uint8_t alphas[] = {0, 1, 128, 255};
   std::ranges::copy(alphas, picture->alpha.Row(0).begin());
@@ -183,7 +188,8 @@ TEST(WritePicture, FlatteningAPalettePictureMayMakeItTooDeep) {
     ASSERT_EQ(NewAlphaPlane(512, 1, picture->alpha), Status::Ok);
     for (size_t x = 0; x < 512; ++x) picture->alpha.Row(0)[x] = x < 256 ? 255 : alpha;
     picture->alphaFlags = kHasAlpha | kFlattenOnBackground;
-    picture->background = 0x0000ff;  // grays with red in them are no grays any more: twice as many colors
+    // grays with red in them are no grays any more: twice as many colors
+    picture->background = 0x0000ff;
     const Status status = WritePicture(*picture, folder.Path("x.fit"), {});
     EXPECT_EQ(status, Status::Ok);
     EXPECT_EQ(picture->bitsPerPixel, alpha == 255 ? 8 : 24);
@@ -228,7 +234,8 @@ TEST(Registry, HoldsEveryRowOfTheFamilies) {
       SCOPED_TRACE(row.extension.view());
       EXPECT_TRUE(seen.insert(row.extension.view()).second) << "two families have this row";
       const auto same = [&](int32_t index) {
-        return FormatRow(index).info == row.info && FormatRow(index).extension.view() == row.extension.view();
+        return FormatRow(index).info == row.info &&
+               FormatRow(index).extension.view() == row.extension.view();
       };
       EXPECT_TRUE(std::ranges::any_of(std::views::iota(0, formatCount), same)) << "the registry has no place for it";
     }
@@ -237,7 +244,8 @@ TEST(Registry, HoldsEveryRowOfTheFamilies) {
 
 TEST(Registry, SettingsOfFormatsAreKeys) {
   for (const FormatSettings* const codec : SettingsOfFormats()) {
-    for (const FormatSetting& setting : codec->keys) EXPECT_NE(FindKey(setting.key), nullptr) << setting.key;
+    for (const FormatSetting& setting : codec->keys)
+      EXPECT_NE(FindKey(setting.key), nullptr) << setting.key;
   }
 }
 

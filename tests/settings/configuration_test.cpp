@@ -132,7 +132,10 @@ TEST_F(ConfigurationTest, StandsOnItsDefaultsWithoutAUsableFile) {
 }
 
 TEST_F(ConfigurationTest, SaveKeepsWhatItDoesNotKnow) {
-  Write("; by hand\r\n[Other]\r\nJpegCompression=1\r\n[Fotomill]\r\nFutureKey=5\r\nJpegCompression=80\r\nPngCompression=bad\r\n");
+  Write(
+      "; by "
+      "hand\r\n[Other]\r\nJpegCompression=1\r\n[Fotomill]\r\nFutureKey=5\r\nJpegCompression="
+      "80\r\nPngCompression=bad\r\n");
   LoadConfiguration();
   settings.JpegCompression = 75;  // its default, which the file must learn
   settings.PrefixCrop = std::string_view("Cut ");
@@ -155,7 +158,8 @@ TEST_F(ConfigurationTest, SaveKeepsWhatItDoesNotKnow) {
 TEST_F(ConfigurationTest, EveryKeyComesBackAsItWasSaved) {
   ASSERT_EQ(LoadConfiguration(), ConfigurationState::Missing);
   const auto give = [](const KeyRow& row) -> std::string {
-    if ((row.type & KEY_TEXT) != 0) return std::string(1, ' ').append(row.name).substr(0, 28).append(1, ' ');
+    if ((row.type & KEY_TEXT) != 0)
+      return std::string(1, ' ').append(row.name).substr(0, 28).append(1, ' ');
     if ((row.type & KEY_FLAG) != 0) return NumberIn(row) != 0 ? "0" : "1";
     return std::to_string(NumberIn(row) == 1 ? 2 : 1);
   };
@@ -254,7 +258,8 @@ TEST_F(ConfigurationTest, MergesWithWhatOthersWroteMeanwhile) {
 }
 
 TEST_F(ConfigurationTest, NoFaultHarmsTheFile) {
-  const std::string before = "; keep\n[Fotomill]\nUndoLevels=5\n", after = "; keep\n[Fotomill]\nUndoLevels=9\n";
+  const std::string before = "; keep\n[Fotomill]\nUndoLevels=5\n",
+                    after = "; keep\n[Fotomill]\nUndoLevels=9\n";
   const int64_t faults = test::ForEachFault([&] {
     const int64_t countdown = platform::faultCountdown.exchange(0);
     Write(before);
@@ -276,7 +281,9 @@ TEST_F(ConfigurationTest, NoFaultHarmsTheFile) {
 }
 
 TEST_F(ConfigurationTest, EarlyKeysComeStraightFromTheFile) {
-  Write("[Fotomill]\nLogoDelay=1\nShowStartupWindow=1\nSmallTextFontSize=x\nNormalThumbFontSize=99\n");
+  Write(
+      "[Fotomill]\nLogoDelay=1\nShowStartupWindow=1\nSmallTextFontSize=x\nNormalThumbFontSize="
+      "99\n");
   const EarlySettings early = ReadEarlySettings();
   EXPECT_EQ(early.logoDelay, 1);
   EXPECT_EQ(early.showStartupWindow, 1);

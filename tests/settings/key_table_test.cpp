@@ -53,7 +53,8 @@ TEST(KeyTable, NearestKeyIsAlwaysNamed) {
 }
 
 TEST(PlainName, LeadsNowhere) {
-  for (const char* name : {"", "Cropped_ ", ".hidden", "a.b", "\xC3\xA4\xFF", "a b [1]"}) EXPECT_TRUE(IsPlainName(name)) << name;
+  for (const char* name : {"", "Cropped_ ", ".hidden", "a.b", "\xC3\xA4\xFF", "a b [1]"})
+    EXPECT_TRUE(IsPlainName(name)) << name;
   using namespace std::string_view_literals;
   for (const auto name : {"/"sv, "a/b"sv, "a\\"sv, ".."sv, "a..b"sv, "a\0b"sv, "\n"sv, "\x7F"sv})
     EXPECT_FALSE(IsPlainName(name)) << name;

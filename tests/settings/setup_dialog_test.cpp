@@ -30,18 +30,26 @@ class FakeDialog : public SetupDialog {
   void Add(KeyNumber key) { At(key); }
 
   bool Has(uint32_t control) const override { return controls_.contains(control); }
-  void SetChecked(uint32_t control, bool checked) override { controls_.at(control).checked = checked; }
+  void SetChecked(uint32_t control, bool checked) override {
+    controls_.at(control).checked = checked;
+  }
   bool IsChecked(uint32_t control) const override { return controls_.at(control).checked; }
-  void SetText(uint32_t control, std::string_view text) override { controls_.at(control).text = text; }
+  void SetText(uint32_t control, std::string_view text) override {
+    controls_.at(control).text = text;
+  }
   std::string Text(uint32_t control) const override { return controls_.at(control).text; }
   void LimitText(uint32_t control, size_t bytes) override { controls_.at(control).limit = bytes; }
-  void SetRange(uint32_t control, const SpinRange& range) override { controls_.at(control).range = range; }
+  void SetRange(uint32_t control, const SpinRange& range) override {
+    controls_.at(control).range = range;
+  }
   void SetColour(uint32_t control, int32_t color) override { controls_.at(control).color = color; }
   int32_t Color(uint32_t control) const override { return controls_.at(control).color; }
   void SetChoices(uint32_t control, std::span<const std::string> texts) override {
     controls_.at(control).choices.assign(texts.begin(), texts.end());
   }
-  void Select(uint32_t control, int32_t position) override { controls_.at(control).selected = position; }
+  void Select(uint32_t control, int32_t position) override {
+    controls_.at(control).selected = position;
+  }
   int32_t Selected(uint32_t control) const override { return controls_.at(control).selected; }
 
  private:
@@ -72,9 +80,9 @@ using enum KeyNumber;
 
 TEST_F(SetupDialogTest, ShowsEachKindAsItsControlDoes) {
   settings.PrefixCrop = std::string_view("Cut ");
-  FakeDialog& dialog =
-      Filled({WriteOS2Bitmaps, UseAlphaChannels, FileTipDelay, PrefixCrop, AnnotateText, FXBrightness, JpegCompression,
-              AlphaBackground, TiffOptions, DefaultViewZoom, JpegProcessor, DefaultFileExtension});
+  FakeDialog& dialog = Filled({WriteOS2Bitmaps, UseAlphaChannels, FileTipDelay, PrefixCrop,
+                               AnnotateText, FXBrightness, JpegCompression, AlphaBackground,
+                               TiffOptions, DefaultViewZoom, JpegProcessor, DefaultFileExtension});
   EXPECT_FALSE(dialog.At(WriteOS2Bitmaps).checked);
   EXPECT_TRUE(dialog.At(UseAlphaChannels).checked);
   EXPECT_TRUE(dialog.At(FileTipDelay).checked) << "500 is on";
@@ -103,8 +111,9 @@ TEST_F(SetupDialogTest, ShowsEachKindAsItsControlDoes) {
 }
 
 TEST_F(SetupDialogTest, TakesUpWhatWasChanged) {
-  FakeDialog& dialog = Filled({WriteOS2Bitmaps, FileTipDelay, PrefixCrop, FXBrightness, JpegCompression, AlphaBackground,
-                               TiffOptions, DefaultViewZoom, JpegProcessor, DefaultFileExtension});
+  FakeDialog& dialog =
+      Filled({WriteOS2Bitmaps, FileTipDelay, PrefixCrop, FXBrightness, JpegCompression,
+              AlphaBackground, TiffOptions, DefaultViewZoom, JpegProcessor, DefaultFileExtension});
   dialog.At(WriteOS2Bitmaps).checked = true;
   dialog.At(FileTipDelay).checked = false;
   dialog.At(PrefixCrop).text = "My ";
@@ -219,16 +228,18 @@ TEST_F(SetupDialogTest, MarkTellsThatWindowsHaveToFollow) {
 TEST_F(SetupDialogTest, MarksWhatIsNotTheDefaultAndPutsTheDefaultBack) {
   const KeyNumber keys[] = {WriteOS2Bitmaps, FileTipDelay,  PrefixCrop,          JpegCompression,
                             AlphaBackground, JpegProcessor, DefaultFileExtension};
-  settings.WriteOS2Bitmaps = settings.JpegProcessor = settings.AlphaBackground = settings.FileTipDelay = 0;
+  settings.WriteOS2Bitmaps = settings.JpegProcessor = settings.AlphaBackground =
+      settings.FileTipDelay = 0;
   settings.JpegCompression = 10;
   settings.PrefixCrop = std::string_view("x");
   settings.DefaultFileExtension = std::string_view("TIF");
-  FakeDialog& dialog =
-      Filled({WriteOS2Bitmaps, FileTipDelay, PrefixCrop, JpegCompression, AlphaBackground, JpegProcessor, DefaultFileExtension});
+  FakeDialog& dialog = Filled({WriteOS2Bitmaps, FileTipDelay, PrefixCrop, JpegCompression,
+                               AlphaBackground, JpegProcessor, DefaultFileExtension});
   for (const KeyNumber key : keys)
     EXPECT_EQ(ShowsDefault(dialog, formats_, KeyOf(key)), key == WriteOS2Bitmaps) << KeyOf(key).name;
   FillSetupDialog(dialog, formats_, Keys(), SetupValues::Default);
-  for (const KeyNumber key : keys) EXPECT_TRUE(ShowsDefault(dialog, formats_, KeyOf(key))) << KeyOf(key).name;
+  for (const KeyNumber key : keys)
+    EXPECT_TRUE(ShowsDefault(dialog, formats_, KeyOf(key))) << KeyOf(key).name;
   EXPECT_EQ(settings.JpegCompression, 10) << "nothing changes before OK";
   ASSERT_FALSE(Read());
   EXPECT_EQ(settings.PrefixCrop.view(), "Cropped_ ");

@@ -12,7 +12,8 @@ std::vector<uint8_t> BitmapFile(int32_t width, int32_t height, int32_t bits) {
   const auto put = [&file](int bytes, uint32_t value) {
     for (int i = 0; i < bytes; ++i) file.push_back(static_cast<uint8_t>(value >> (8 * i)));
   };
-  for (const uint32_t value : {offset + rows, 0u, offset, 40u, static_cast<uint32_t>(width), static_cast<uint32_t>(height)}) {
+  for (const uint32_t value : {offset + rows, 0u, offset, 40u, static_cast<uint32_t>(width),
+                               static_cast<uint32_t>(height)}) {
     put(4, value);
   }
   put(2, 1);

@@ -18,7 +18,9 @@ std::string NameOf(const TemporaryFolder& folder, std::span<const uint8_t> file)
 
 }  // namespace
 
-ReadRequest RequestFor(const std::string& fileName) { return {.fileName = fileName, .options = ReadOptionsFromSettings()}; }
+ReadRequest RequestFor(const std::string& fileName) {
+  return {.fileName = fileName, .options = ReadOptionsFromSettings()};
+}
 
 Decoded Describe(InfoOperation info, std::span<const uint8_t> file) {
   const TemporaryFolder folder;
@@ -72,15 +74,18 @@ PicturePointer PatternPicture(int32_t width, int32_t height, int32_t bitsPerPixe
   picture->width = width;
   picture->height = height;
   picture->bitsPerPixel = bitsPerPixel;
-  MakeDefaultPalette(&picture->palette, nullptr, bitsPerPixel == 1 ? kBlackAndWhitePalette : kDisplayPalette);
-  if (NewPackedImage(width, height, &picture->palette, bitsPerPixel, picture->image) != Status::Ok) return picture;
+  MakeDefaultPalette(&picture->palette, nullptr,
+                     bitsPerPixel == 1 ? kBlackAndWhitePalette : kDisplayPalette);
+  if (NewPackedImage(width, height, &picture->palette, bitsPerPixel, picture->image) != Status::Ok)
+    return picture;
   uint32_t state = 1;
   int32_t value = 0;
   for (int32_t i = 0; i < width * height; ++i) {
     state = state * 1664525 + 1013904223;
     // Runs in even blocks of 64 pixels, single values in odd ones.
     if (i % 64 < 32 ? state >> 28 == 0 : true) value = static_cast<int32_t>(state >> 8);
-    SetPixel(picture->image, i % width, i / width, bitsPerPixel < 24 ? value & ((1 << bitsPerPixel) - 1) : value);
+    SetPixel(picture->image, i % width, i / width,
+             bitsPerPixel < 24 ? value & ((1 << bitsPerPixel) - 1) : value);
   }
   return picture;
 }

@@ -13,7 +13,8 @@ std::string Contents(std::FILE* file) {
   std::string contents;
   std::rewind(file);
   char buffer[4096];
-  while (const size_t count = std::fread(buffer, 1, sizeof buffer, file)) contents.append(buffer, count);
+  while (const size_t count = std::fread(buffer, 1, sizeof buffer, file))
+    contents.append(buffer, count);
   std::fclose(file);
   return contents;
 }
@@ -22,7 +23,8 @@ std::string Contents(std::FILE* file) {
 
 CommandResult RunCommand(const std::vector<std::string>& arguments, const Terminal& terminal) {
   const ScopedSettings keep;  // options may change some for the run
-  cli::Io io{std::tmpfile(), std::tmpfile(), std::tmpfile(), terminal.interactive, terminal.output, terminal.interactive};
+  cli::Io io{std::tmpfile(),       std::tmpfile(),  std::tmpfile(),
+             terminal.interactive, terminal.output, terminal.interactive};
   std::fwrite(terminal.input.data(), 1, terminal.input.size(), io.in);
   std::rewind(io.in);
   std::vector<const char*> words{"fotomill"};

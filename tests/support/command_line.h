@@ -17,11 +17,13 @@ struct CommandResult {
   std::string out, err;
 
   // The standard error, in which each text stands on a line of its own.
-  bool Says(const std::string& line) const { return ("\n" + err).find("\n" + line + "\n") != std::string::npos; }
+  bool Says(const std::string& line) const {
+    return ("\n" + err).find("\n" + line + "\n") != std::string::npos;
+  }
 };
 
-// Runs one command line in this process, with temporary files as its streams. `arguments` come without the program's
-// name.
+// Runs one command line in this process, with temporary files as its streams. `arguments` come
+// without the program's name.
 CommandResult RunCommand(const std::vector<std::string>& arguments, const Terminal& terminal = {});
 
 }  // namespace fotomill::test

@@ -8,7 +8,8 @@
 
 namespace fotomill::test {
 
-// One picture's block in both byte orders: first directory, thumbnail, EXIF and GPS directories, the same values in each.
+// One picture's block in both byte orders: first directory, thumbnail, EXIF and GPS directories,
+// the same values in each.
 std::vector<uint8_t> BigEndianBlock();
 std::vector<uint8_t> LittleEndianBlock();
 
@@ -19,7 +20,9 @@ class CollectedLines : public ExifSink {
     numbers.push_back(number);
     lines.push_back("DIRECTORY " + std::string(label));
   }
-  void Line(const ExifLine& line) override { lines.push_back(std::string(line.name) + "=" + std::string(line.text)); }
+  void Line(const ExifLine& line) override {
+    lines.push_back(std::string(line.name) + "=" + std::string(line.text));
+  }
   std::vector<std::string> lines;
   std::vector<int32_t> numbers;
 };

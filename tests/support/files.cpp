@@ -20,18 +20,22 @@ TemporaryFolder::~TemporaryFolder() {
   fs::remove_all(path_, ignored);
 }
 
-std::string TemporaryFolder::Path(std::string_view name) const { return name.empty() ? path_.string() : (path_ / name).string(); }
+std::string TemporaryFolder::Path(std::string_view name) const {
+  return name.empty() ? path_.string() : (path_ / name).string();
+}
 
 std::vector<std::string> TemporaryFolder::Names() const {
   std::vector<std::string> names;
-  for (const auto& entry : fs::directory_iterator(path_)) names.push_back(entry.path().filename().string());
+  for (const auto& entry : fs::directory_iterator(path_))
+    names.push_back(entry.path().filename().string());
   std::sort(names.begin(), names.end());
   return names;
 }
 
 void WriteBytes(const std::string& path, std::span<const uint8_t> bytes) {
   std::ofstream(path, std::ios::binary)
-      .write(reinterpret_cast<const char*>(bytes.data()), static_cast<std::streamsize>(bytes.size()));
+      .write(reinterpret_cast<const char*>(bytes.data()),
+             static_cast<std::streamsize>(bytes.size()));
 }
 
 void WriteText(const std::string& path, std::string_view text) {
@@ -48,7 +52,9 @@ std::vector<uint8_t> ReadBytes(const std::string& path) {
   return {text.begin(), text.end()};
 }
 
-std::string SourcePath(std::string_view relative) { return std::string(FOTOMILL_SOURCE_DIR) + "/" + std::string(relative); }
+std::string SourcePath(std::string_view relative) {
+  return std::string(FOTOMILL_SOURCE_DIR) + "/" + std::string(relative);
+}
 
 std::string CorpusFolder() {
   const char* folder = std::getenv("FOTOMILL_CORPUS");

@@ -31,7 +31,8 @@ std::string ReadText(const std::string& path);
 
 // A file of this project, such as "samples/plugin".
 std::string SourcePath(std::string_view relative);
-// The folder of real pictures that FOTOMILL_CORPUS names, empty when there is none; tests that use it skip without it.
+// The folder of real pictures that FOTOMILL_CORPUS names, empty when there is none; tests that use
+// it skip without it.
 std::string CorpusFolder();
 
 }  // namespace fotomill::test

@@ -1,5 +1,5 @@
-// The main function of every test program: it serves as a process apart as the program does, with the program's tasks and those
-// of the tests.
+// The main function of every test program: it serves as a process apart as the program does, with
+// the program's tasks and those of the tests.
 #include <fcntl.h>
 #include <gmock/gmock.h>
 #include <unistd.h>
@@ -21,7 +21,8 @@ using fotomill::platform::ApartTask;
 bool Echo(const ApartCall& call) {
   call.tell(getpid());
   call.tell(static_cast<int32_t>(call.request.size()));
-  std::copy_n(call.input.begin(), std::min(call.input.size(), call.reply.size()), call.reply.begin());
+  std::copy_n(call.input.begin(), std::min(call.input.size(), call.reply.size()),
+              call.reply.begin());
   return true;
 }
 

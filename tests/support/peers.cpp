@@ -7,7 +7,9 @@
 
 namespace fotomill::test {
 
-bool RunShell(const std::string& commandLine) { return std::system(("(" + commandLine + ") 2>/dev/null").c_str()) == 0; }
+bool RunShell(const std::string& commandLine) {
+  return std::system(("(" + commandLine + ") 2>/dev/null").c_str()) == 0;
+}
 
 bool HasProgram(const std::string& name) { return RunShell("command -v " + name + " >/dev/null"); }
 

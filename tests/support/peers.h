@@ -12,7 +12,8 @@ bool HasProgram(const std::string& name);
 // Runs a command line of the shell. True when it ends with exit status 0.
 bool RunShell(const std::string& commandLine);
 
-// A picture as netpbm's programs write it (raw PBM or PGM): one value a pixel, from the top; 1 is black in a PBM.
+// A picture as netpbm's programs write it (raw PBM or PGM): one value a pixel, from the top; 1 is
+// black in a PBM.
 struct PnmPicture {
   int32_t width = 0, height = 0;
   std::vector<uint8_t> values;

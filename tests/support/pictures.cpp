@@ -4,14 +4,16 @@
 
 namespace fotomill::test {
 
-PicturePointer MakePicture(int32_t width, int32_t height, int32_t bitsPerPixel, const std::vector<std::vector<uint8_t>>& rows) {
+PicturePointer MakePicture(int32_t width, int32_t height, int32_t bitsPerPixel,
+                           const std::vector<std::vector<uint8_t>>& rows) {
   PicturePointer picture = NewPictureRecord();
   picture->width = width;
   picture->height = height;
   picture->bitsPerPixel = bitsPerPixel;
   picture->palette = GrayRamp();
   if (bitsPerPixel == 1) MakeDefaultPalette(&picture->palette, nullptr, kBlackAndWhitePalette);
-  if (NewPackedImage(width, height, &picture->palette, bitsPerPixel, picture->image) != Status::Ok) return nullptr;
+  if (NewPackedImage(width, height, &picture->palette, bitsPerPixel, picture->image) != Status::Ok)
+    return nullptr;
   for (size_t y = 0; y < rows.size(); ++y) {
     const auto row = picture->image.Row(static_cast<int32_t>(y));
     std::copy_n(rows[y].begin(), std::min(rows[y].size(), row.size()), row.begin());
@@ -20,7 +22,8 @@ PicturePointer MakePicture(int32_t width, int32_t height, int32_t bitsPerPixel, 
 }
 
 std::vector<uint8_t> RowOf(const PackedImage& image, int32_t y) {
-  const auto row = image.Row(y).first((static_cast<size_t>(image.Width()) * static_cast<size_t>(image.Bits()) + 7) / 8);
+  const auto row = image.Row(y).first(
+      (static_cast<size_t>(image.Width()) * static_cast<size_t>(image.Bits()) + 7) / 8);
   return {row.begin(), row.end()};
 }
 

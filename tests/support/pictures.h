@@ -8,8 +8,9 @@
 
 namespace fotomill::test {
 
-// A picture with an image, black and white, in the gray ramp or in color. `rows` are its rows from the top as they lie
-// in the image, each cut or filled with zeros to the stride; missing ones are zero.
+// A picture with an image, black and white, in the gray ramp or in color. `rows` are its rows from
+// the top as they lie in the image, each cut or filled with zeros to the stride; missing ones are
+// zero.
 PicturePointer MakePicture(int32_t width, int32_t height, int32_t bitsPerPixel,
                            const std::vector<std::vector<uint8_t>>& rows = {});
 

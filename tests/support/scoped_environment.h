@@ -13,7 +13,8 @@ class ScopedEnvironment {
     if (const char* old = std::getenv(name)) saved_ = old;
     Set(value);
   }
-  ScopedEnvironment(const char* name, const std::string& value) : ScopedEnvironment(name, value.c_str()) {}
+  ScopedEnvironment(const char* name, const std::string& value)
+      : ScopedEnvironment(name, value.c_str()) {}
   ~ScopedEnvironment() { Set(saved_ ? saved_->c_str() : nullptr); }
   ScopedEnvironment(const ScopedEnvironment&) = delete;
   ScopedEnvironment& operator=(const ScopedEnvironment&) = delete;

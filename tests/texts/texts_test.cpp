@@ -33,7 +33,8 @@ TEST(Texts, RecordedTextsKeepTheirEnglish) {
   EXPECT_EQ(text.english, "First 1. Second.");
 }
 
-// Texts of tables are translated where they are shown; xgettext finds them only if the table marks them with TrLater.
+// Texts of tables are translated where they are shown; xgettext finds them only if the table marks
+// them with TrLater.
 TEST(Texts, TablesAreMarkedForTranslation) {
   std::string pot;
   ASSERT_EQ(platform::ReadWholeFile(test::SourcePath("po/fotomill.pot"), limits.listFileBytes, pot), platform::ReadResult::Done);

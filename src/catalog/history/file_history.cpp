@@ -23,19 +23,35 @@ namespace fotomill {
 
 namespace {
 
-constexpr std::string_view kNames[] = {
-    TrLater("View"),      TrLater("Paint"),          TrLater("Contact sheet"), TrLater("Web gallery"),
-    TrLater("Annotate"),  TrLater("Print"),          TrLater("Transform"),     TrLater("Filter"),
-    TrLater("Effects"),   TrLater("Convert"),        TrLater("Get info"),      TrLater("Move and copy"),
-    TrLater("Copy to clipboard"), TrLater("Crop"),   TrLater("Matt"),          TrLater("Watermark"),
-    TrLater("File time"), TrLater("Photo workshop"), TrLater("Find similar"),  TrLater("Catalog")};
+constexpr std::string_view kNames[] = {TrLater("View"),
+                                       TrLater("Paint"),
+                                       TrLater("Contact sheet"),
+                                       TrLater("Web gallery"),
+                                       TrLater("Annotate"),
+                                       TrLater("Print"),
+                                       TrLater("Transform"),
+                                       TrLater("Filter"),
+                                       TrLater("Effects"),
+                                       TrLater("Convert"),
+                                       TrLater("Get info"),
+                                       TrLater("Move and copy"),
+                                       TrLater("Copy to clipboard"),
+                                       TrLater("Crop"),
+                                       TrLater("Matt"),
+                                       TrLater("Watermark"),
+                                       TrLater("File time"),
+                                       TrLater("Photo workshop"),
+                                       TrLater("Find similar"),
+                                       TrLater("Catalog")};
 static_assert(std::size(kNames) == kFileFunctionCount);
 
 constexpr std::string_view kExtension = ".fhdb";
-constexpr std::string_view kPathTag = "\tPATH:", kFunctionTag = "\tFUNCTION:", kAccessedTag = "\tACCESSED:", kEndTag = "\tEND:";
+constexpr std::string_view kPathTag = "\tPATH:", kFunctionTag = "\tFUNCTION:",
+                           kAccessedTag = "\tACCESSED:", kEndTag = "\tEND:";
 constexpr size_t kLongestLine = 4095;  // what is longer continues as a line of its own
 
-// What is known of an entry. With the thumbnail that belongs to it in the list's window it is one slot.
+// What is known of an entry. With the thumbnail that belongs to it in the list's window it is one
+// slot.
 #pragma pack(push, 1)
 struct Slot {
   char path[261];  // zero-terminated
@@ -48,26 +64,33 @@ constexpr uint64_t kSlotBytes = sizeof(Slot) + sizeof(ThumbnailRecord);
 constexpr uint64_t kGrowth = 128;  // entries
 static_assert(kSlotBytes == 28193 && kGrowth * kSlotBytes == 3608704);
 
-int32_t Clamped(int64_t seconds) { return static_cast<int32_t>(std::clamp<int64_t>(seconds, INT32_MIN, INT32_MAX)); }
+int32_t Clamped(int64_t seconds) {
+  return static_cast<int32_t>(std::clamp<int64_t>(seconds, INT32_MIN, INT32_MAX));
+}
 
-std::string_view PathOf(const Slot& slot) { return {slot.path, strnlen(slot.path, sizeof slot.path - 1)}; }
+std::string_view PathOf(const Slot& slot) {
+  return {slot.path, strnlen(slot.path, sizeof slot.path - 1)};
+}
 
-// Whether `a` is before `b`: the later use, of equal ones the higher file name, then the higher path.
+// Whether `a` is before `b`: the later use, of equal ones the higher file name, then the higher
+// path.
 bool StandsBefore(const Slot& a, const Slot& b) {
   if (a.accessed != b.accessed) return a.accessed > b.accessed;
-  const std::string_view aName = platform::FileNameOf(PathOf(a)), bName = platform::FileNameOf(PathOf(b));
+  const std::string_view aName = platform::FileNameOf(PathOf(a)),
+                         bName = platform::FileNameOf(PathOf(b));
   return aName != bName ? aName > bName : PathOf(a) > PathOf(b);
 }
 
-// The list. Its room holds the fixed parts of all slots in front and room for their thumbnails behind, so that of the much
-// that is reserved only what holds entries is ever touched.
+// The list. Its room holds the fixed parts of all slots in front and room for their thumbnails
+// behind, so that of the much that is reserved only what holds entries is ever touched.
 class HistoryList {
  public:
   bool Exists() const { return !room_.Empty(); }
   size_t Count() const { return order_.size(); }
   const Slot& At(size_t index) const { return Slots()[order_[index]]; }
 
-  bool Record(std::string_view path, int32_t function, int32_t created, int32_t accessed, uint64_t size) {
+  bool Record(std::string_view path, int32_t function, int32_t created, int32_t accessed,
+              uint64_t size) {
     if (!MakeRoom()) return false;
     const auto found = slotOf_.find(std::string(path));
     uint32_t number = 0;
@@ -101,10 +124,12 @@ class HistoryList {
   // The thumbnail in an entry's slot, which is filled when it is first asked for.
   const ThumbnailRecord* Thumbnail(size_t index) {
     const uint32_t number = order_[index];
-    const uint64_t offset = room_.Size() / kSlotBytes * sizeof(Slot) + number * sizeof(ThumbnailRecord);
+    const uint64_t offset =
+        room_.Size() / kSlotBytes * sizeof(Slot) + number * sizeof(ThumbnailRecord);
     ThumbnailRecord& record = room_.Items<ThumbnailRecord>(offset, 1)[0];
     hasThumbnail_.resize(used_);
-    if (!hasThumbnail_[number]) hasThumbnail_[number] = ReadThumbnailFile(record, ThumbnailPathFor(PathOf(At(index))));
+    if (!hasThumbnail_[number])
+      hasThumbnail_[number] = ReadThumbnailFile(record, ThumbnailPathFor(PathOf(At(index))));
     return hasThumbnail_[number] ? &record : nullptr;
   }
 
@@ -124,8 +149,9 @@ class HistoryList {
 
   // Where a slot is in the order, or would be.
   std::vector<uint32_t>::iterator Place(uint32_t number) {
-    return std::lower_bound(order_.begin(), order_.end(), number,
-                            [this](uint32_t a, uint32_t b) { return a != b && StandsBefore(Slots()[a], Slots()[b]); });
+    return std::lower_bound(order_.begin(), order_.end(), number, [this](uint32_t a, uint32_t b) {
+      return a != b && StandsBefore(Slots()[a], Slots()[b]);
+    });
   }
 
   uint32_t FreeSlot() {
@@ -136,8 +162,9 @@ class HistoryList {
     return number;
   }
 
-  // A full list asks for room for count x 128 slots and counts on 128 entries more. That is far more than it counts on, so
-  // where it cannot be had, the room that is there lasts as long as it has slots.
+  // A full list asks for room for count x 128 slots and counts on 128 entries more. That is far
+  // more than it counts on, so where it cannot be had, the room that is there lasts as long as it
+  // has slots.
   bool MakeRoom() {
     if (room_.Empty()) {
       if (!room_.Reserve(kGrowth * kSlotBytes)) return false;
@@ -145,7 +172,8 @@ class HistoryList {
     }
     if (order_.size() < capacity_) return true;
     platform::ReservedMemory larger;
-    if (!larger.Reserve(order_.size() * kGrowth * kSlotBytes)) return order_.size() < room_.Size() / kSlotBytes;
+    if (!larger.Reserve(order_.size() * kGrowth * kSlotBytes))
+      return order_.size() < room_.Size() / kSlotBytes;
     std::memcpy(larger.Items<Slot>(0, used_).data(), Slots(), used_ * sizeof(Slot));
     room_ = std::move(larger);
     hasThumbnail_.clear();  // they are read again rather than copied, if ever
@@ -191,11 +219,13 @@ std::string_view TakeLine(std::string_view& text) {
   const size_t end = std::min({text.find('\n'), text.size() - 1, kLongestLine - 1});
   std::string_view line = text.substr(0, end + 1);
   text.remove_prefix(line.size());
-  while (!line.empty() && line[0] != '\t' && static_cast<unsigned char>(line[0]) <= ' ') line.remove_prefix(1);
+  while (!line.empty() && line[0] != '\t' && static_cast<unsigned char>(line[0]) <= ' ')
+    line.remove_prefix(1);
   return line.substr(0, line.find_first_of(std::string_view("\n\r\0", 3)));
 }
 
-// Records the entries of a history file's text. False when it holds bytes, but no line of a history.
+// Records the entries of a history file's text. False when it holds bytes, but no line of a
+// history.
 bool ReadEntries(const HistoryOptions& options, std::string_view text) {
   bool any = text.empty();
   while (!text.empty()) {
@@ -203,9 +233,11 @@ bool ReadEntries(const HistoryOptions& options, std::string_view text) {
     std::string_view path, function, accessed;
     if (!line.starts_with('\t') || !FindField(line, kPathTag, path) || path.empty()) continue;
     any = true;
-    const int64_t number = FindField(line, kFunctionTag, function) ? LeadingInteger(function) : kNoFileFunction;
+    const int64_t number =
+        FindField(line, kFunctionTag, function) ? LeadingInteger(function) : kNoFileFunction;
     if (number < 0 || number >= kFileFunctionCount) continue;
-    const int32_t time = FindField(line, kAccessedTag, accessed) ? Clamped(LeadingInteger(accessed)) : kOwnTime;
+    const int32_t time =
+        FindField(line, kAccessedTag, accessed) ? Clamped(LeadingInteger(accessed)) : kOwnTime;
     (void)RecordFileHistory(options, path, static_cast<FileFunction>(number), kOwnTime, time);
   }
   return any;
@@ -241,8 +273,9 @@ HistoryUpdate UpdateOf(EditResult result) {
 size_t RecordUses(const HistoryOptions& options, std::span<const FileUse> uses) {
   size_t recorded = 0;
   for (const FileUse& use : uses) {
-    recorded += use.removed ? RemoveFromFileHistory(use.path)
-                            : RecordFileHistory(options, use.path, use.function, use.created, use.accessed);
+    recorded += use.removed
+                    ? RemoveFromFileHistory(use.path)
+                    : RecordFileHistory(options, use.path, use.function, use.created, use.accessed);
   }
   return recorded;
 }
@@ -254,7 +287,8 @@ std::string_view FileFunctionName(int32_t function) {
 }
 
 int32_t FileFunctionOfName(std::string_view name) {
-  const auto* const found = std::ranges::find_if(kNames, [&](std::string_view known) { return EqualIgnoringCase(known, name); });
+  const auto* const found = std::ranges::find_if(
+      kNames, [&](std::string_view known) { return EqualIgnoringCase(known, name); });
   return found == std::end(kNames) ? kNoFileFunction : static_cast<int32_t>(found - kNames);
 }
 
@@ -263,8 +297,8 @@ bool FitsFileHistory(std::string_view path) {
          path.find_first_of(std::string_view("\t\n\r\0", 4)) == std::string_view::npos;
 }
 
-bool RecordFileHistory(const HistoryOptions& options, std::string_view path, FileFunction function, int32_t created,
-                       int32_t accessed) {
+bool RecordFileHistory(const HistoryOptions& options, std::string_view path, FileFunction function,
+                       int32_t created, int32_t accessed) {
   const auto number = static_cast<int32_t>(function);
   if (!options.on || number < 0 || number >= kFileFunctionCount) return false;
   if ((options.functions >> number & 1) == 0 || !FitsFileHistory(path)) return false;
@@ -297,8 +331,8 @@ bool SaveFileHistory(const HistoryOptions& options) {
   if (!options.on || (!list.Exists() && loaded)) {
     saved = DeleteHistoryFile(options);
   } else if (list.Exists() && !FileHistoryPath(options).empty()) {
-    const EditResult result =
-        EditTextFile(FileHistoryPath(options), limits.listFileBytes, [](std::string& text) { text = TextOfList(); });
+    const EditResult result = EditTextFile(FileHistoryPath(options), limits.listFileBytes,
+                                           [](std::string& text) { text = TextOfList(); });
     saved = UpdateOf(result) == HistoryUpdate::Done;
   }
   ClearFileHistory();
@@ -325,11 +359,13 @@ FileHistoryEntry FileHistoryAt(size_t index) {
 
 const ThumbnailRecord* FileHistoryThumbnail(size_t index) { return list.Thumbnail(index); }
 
-HistoryUpdate UpdateFileHistory(const HistoryOptions& options, std::span<const FileUse> uses, size_t* recorded) {
+HistoryUpdate UpdateFileHistory(const HistoryOptions& options, std::span<const FileUse> uses,
+                                size_t* recorded) {
   if (recorded != nullptr) *recorded = 0;
   ClearFileHistory();
   if (!options.on) {
-    return options.offForGood && !DeleteHistoryFile(options) ? HistoryUpdate::Failed : HistoryUpdate::Off;
+    return options.offForGood && !DeleteHistoryFile(options) ? HistoryUpdate::Failed
+                                                             : HistoryUpdate::Off;
   }
   const std::string path = FileHistoryPath(options);
   if (path.empty()) return HistoryUpdate::Failed;

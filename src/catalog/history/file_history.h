@@ -10,12 +10,15 @@ namespace fotomill {
 template <int32_t side> struct SquareThumbnailRecord;
 using ThumbnailRecord = SquareThumbnailRecord<96>;
 
-// The file history: which picture files the user applied which function to, and when. A list in memory, kept between runs
-// in the text file FileHistoryDatabase + ".fhdb" of the data folder, one line for each entry in list order:
+// The file history: which picture files the user applied which function to, and when. A list in
+// memory, kept between runs in the text file FileHistoryDatabase + ".fhdb" of the data folder, one
+// line for each entry in list order:
 //
-//   tab PATH: path  tab FUNCTION: decimal  tab ACCESSED: decimal seconds since 1970 UTC  tab END: newline
+//   tab PATH: path  tab FUNCTION: decimal  tab ACCESSED: decimal seconds since 1970 UTC  tab END:
+//   newline
 //
-// Creation time and size are asked of the file again when an entry is loaded. All of this belongs to the main thread.
+// Creation time and size are asked of the file again when an entry is loaded. All of this belongs
+// to the main thread.
 
 // Numbers in the file, and bits of FileHistoryFunctions.
 enum class FileFunction : int32_t {
@@ -62,21 +65,24 @@ int32_t FileFunctionOfName(std::string_view name);
 // Stands for the file's own creation time, or for now.
 inline constexpr int32_t kOwnTime = -1;
 
-// Whether a path comes back from the file as it was: 1 to 260 bytes without tab, line end or zero byte.
+// Whether a path comes back from the file as it was: 1 to 260 bytes without tab, line end or zero
+// byte.
 bool FitsFileHistory(std::string_view path);
 
-// Adds an entry, or gives the entry of that path another function and access time, puts the list in order and limits it
-// as the options say. False when nothing was recorded: the history or that function is switched off, the path is no
-// regular file or does not fit, or there is no memory.
-bool RecordFileHistory(const HistoryOptions& options, std::string_view path, FileFunction function, int32_t created = kOwnTime,
-                       int32_t accessed = kOwnTime);
+// Adds an entry, or gives the entry of that path another function and access time, puts the list in
+// order and limits it as the options say. False when nothing was recorded: the history or that
+// function is switched off, the path is no regular file or does not fit, or there is no memory.
+bool RecordFileHistory(const HistoryOptions& options, std::string_view path, FileFunction function,
+                       int32_t created = kOwnTime, int32_t accessed = kOwnTime);
 // Takes the entry of a path out of the list. False if there is none.
 bool RemoveFromFileHistory(std::string_view path);
 
-// Reads the history file into the list. False when the history is switched off or the file cannot be read.
+// Reads the history file into the list. False when the history is switched off or the file cannot
+// be read.
 bool LoadFileHistory(const HistoryOptions& options);
-// Writes the list to the history file, as it is, and frees it. Switched off, the history file is deleted; without a list
-// as well, provided that LoadFileHistory was called before. False when the file cannot be written or was never read.
+// Writes the list to the history file, as it is, and frees it. Switched off, the history file is
+// deleted; without a list as well, provided that LoadFileHistory was called before. False when the
+// file cannot be written or was never read.
 bool SaveFileHistory(const HistoryOptions& options);
 // Frees the list.
 bool ClearFileHistory();
@@ -94,8 +100,8 @@ struct FileHistoryEntry {
 // How many entries the list has; 0 while it is not loaded.
 size_t FileHistoryCount();
 FileHistoryEntry FileHistoryAt(size_t index);  // from 0, the last use first
-// The thumbnail of an entry, read from its file's thumbnail file when it is first asked for; null if there is none. It
-// stays where it is until the list changes.
+// The thumbnail of an entry, read from its file's thumbnail file when it is first asked for; null
+// if there is none. It stays where it is until the list changes.
 const ThumbnailRecord* FileHistoryThumbnail(size_t index);
 
 // What a command did to a file.
@@ -114,9 +120,11 @@ enum class HistoryUpdate {
   NotRead,  // the history file cannot be read, or is something else: it was left alone
   Failed,   // it could not be written, or there is no place for it: it is unchanged
 };
-// Records uses, in order, permanently: locks the history file, reads it afresh, so that what other processes recorded stays,
-// records, and replaces the file in one step. `recorded` counts the uses that were. With the history switched off permanently the
-// history file is deleted; switched off for this run only, it stays. The list is free afterwards.
-HistoryUpdate UpdateFileHistory(const HistoryOptions& options, std::span<const FileUse> uses, size_t* recorded = nullptr);
+// Records uses, in order, permanently: locks the history file, reads it afresh, so that what other
+// processes recorded stays, records, and replaces the file in one step. `recorded` counts the uses
+// that were. With the history switched off permanently the history file is deleted; switched off
+// for this run only, it stays. The list is free afterwards.
+HistoryUpdate UpdateFileHistory(const HistoryOptions& options, std::span<const FileUse> uses,
+                                size_t* recorded = nullptr);
 
 }  // namespace fotomill

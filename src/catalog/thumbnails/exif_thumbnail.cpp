@@ -15,7 +15,8 @@ Status DecodeExifThumbnail(std::span<const uint8_t> bytes, PicturePointer& pictu
   return LoadPicture({.fileName = file.Path()}, picture);
 }
 
-Status EncodeExifThumbnail(PictureRecord& picture, const EncodeOptions& options, std::vector<uint8_t>& bytes) {
+Status EncodeExifThumbnail(PictureRecord& picture, const EncodeOptions& options,
+                           std::vector<uint8_t>& bytes) {
   bytes.clear();
   platform::TemporaryFile file;
   if (!file.Create(".JPG")) return Status::ErrorCreatingFile;

@@ -10,11 +10,13 @@
 
 namespace fotomill {
 
-// Decodes an embedded thumbnail, a JPEG stream, by way of a working file with the extension ".JPG" that is deleted again.
-// `picture` is null unless Ok; EmptyImage (31) without bytes, ErrorCreatingFile (10) or ErrorWritingFile (11) for the working file,
-// else the status of the JPEG codec.
+// Decodes an embedded thumbnail, a JPEG stream, by way of a working file with the extension ".JPG"
+// that is deleted again. `picture` is null unless Ok; EmptyImage (31) without bytes,
+// ErrorCreatingFile (10) or ErrorWritingFile (11) for the working file, else the status of the JPEG
+// codec.
 Status DecodeExifThumbnail(std::span<const uint8_t> bytes, PicturePointer& picture);
 // The way back; `bytes` is empty unless Ok.
-Status EncodeExifThumbnail(PictureRecord& picture, const EncodeOptions& options, std::vector<uint8_t>& bytes);
+Status EncodeExifThumbnail(PictureRecord& picture, const EncodeOptions& options,
+                           std::vector<uint8_t>& bytes);
 
 }  // namespace fotomill

@@ -30,8 +30,9 @@ std::string CachedFile(const CacheFolder& folder, std::string_view uri) {
   const std::string cache = platform::SpecialFolderPath(platform::SpecialFolder::Cache);
   if (cache.empty()) return {};
   const std::span bytes(reinterpret_cast<const uint8_t*>(uri.data()), uri.size());
-  return platform::JoinFolder(platform::JoinFolder(platform::JoinFolder(cache, "thumbnails"), folder.name),
-                              Md5Text(bytes) + ".png");
+  return platform::JoinFolder(
+      platform::JoinFolder(platform::JoinFolder(cache, "thumbnails"), folder.name),
+      Md5Text(bytes) + ".png");
 }
 
 // The value of a text chunk with that key.
@@ -39,7 +40,8 @@ bool HasText(std::span<const uint8_t> file, std::string_view key, std::string_vi
   PngChunks chunks(file);
   for (PngChunk chunk; chunks.Next(chunk);) {
     if (chunk.type != "tEXt") continue;
-    const std::string_view text(reinterpret_cast<const char*>(chunk.data.data()), chunk.data.size());
+    const std::string_view text(reinterpret_cast<const char*>(chunk.data.data()),
+                                chunk.data.size());
     const size_t end = text.find('\0');
     if (end == std::string_view::npos || text.substr(0, end) != key) continue;
     value = text.substr(end + 1);
@@ -93,7 +95,8 @@ PicturePointer ReadSystemPicture(const std::string& picturePath, int32_t side) {
   return nullptr;
 }
 
-bool ReadSystemThumbnail(const std::string& picturePath, Color matte, LargeThumbnailRecord& record) {
+bool ReadSystemThumbnail(const std::string& picturePath, Color matte,
+                         LargeThumbnailRecord& record) {
   const PicturePointer picture = ReadCached(picturePath, kCacheFolders[0]);
   return picture != nullptr && MakeLargeThumbnailRecord(record, *picture, matte);
 }

@@ -23,11 +23,14 @@ static_assert(kPathOffset == sizeof(ThumbnailRecord) && kVolumeOffset == kPathOf
               kFlagsOffset == kVolumeOffset + kTextSize && kFlagsOffset + 8 == kDatabaseRecordSize);
 constexpr uint8_t kDeletedFlag = 1;
 constexpr size_t kKeySize = kDatabaseRecordSize - kPathOffset;
-constexpr int64_t kLargeIndex = 1000;  // records; the index of fewer is made faster than it is worth a file
+// records; the index of fewer is made faster than it is worth a file
+constexpr int64_t kLargeIndex = 1000;
 
 std::string IndexPath(const std::string& databasePath) { return databasePath + ".index"; }
 
-uint64_t OffsetOf(int64_t index) { return kDatabaseHeaderSize + static_cast<uint64_t>(index) * kDatabaseRecordSize; }
+uint64_t OffsetOf(int64_t index) {
+  return kDatabaseHeaderSize + static_cast<uint64_t>(index) * kDatabaseRecordSize;
+}
 
 void PutLe32(uint8_t* bytes, uint32_t value) {
   for (int i = 0; i < 4; ++i) bytes[i] = static_cast<uint8_t>(value >> (8 * i));
@@ -96,7 +99,8 @@ bool ReadHeaderOf(const platform::StoreFile& file, DatabaseHeader& header) {
 
 // How many of the counted records a file of a size holds.
 int64_t RecordsIn(const DatabaseHeader& header, uint64_t size) {
-  const auto most = static_cast<int64_t>(size < kDatabaseHeaderSize ? 0 : (size - kDatabaseHeaderSize) / kDatabaseRecordSize);
+  const auto most = static_cast<int64_t>(
+      size < kDatabaseHeaderSize ? 0 : (size - kDatabaseHeaderSize) / kDatabaseRecordSize);
   return std::clamp<int64_t>(header.count, 0, most);
 }
 
@@ -119,14 +123,18 @@ bool IsLeftover(const std::string& path) {
   platform::StoreFile file;
   std::array<uint8_t, kDatabaseMagic.size()> magic{};
   if (facts.size == 0) return true;
-  return file.Open(path, platform::StoreFile::Mode::Read) == platform::StoreFile::OpenResult::Done && file.ReadAt(0, magic) &&
-         std::ranges::equal(magic, kDatabaseMagic, {}, {}, [](char c) { return static_cast<uint8_t>(c); });
+  return file.Open(path, platform::StoreFile::Mode::Read) ==
+             platform::StoreFile::OpenResult::Done &&
+         file.ReadAt(0, magic) && std::ranges::equal(magic, kDatabaseMagic, {}, {}, [](char c) {
+           return static_cast<uint8_t>(c);
+         });
 }
 
 bool MakeEmptyDatabase(const std::string& path, bool hidden, bool& taken) {
   const auto now = static_cast<uint32_t>(platform::Now());
   platform::OutputFile file;
-  if (!file.Create(path) || !file.Write(BytesOf(DatabaseHeader{kDatabaseVersion, 0, now, now}))) return false;
+  if (!file.Create(path) || !file.Write(BytesOf(DatabaseHeader{kDatabaseVersion, 0, now, now})))
+    return false;
   const platform::CommitResult result = file.Commit(platform::Existing::Refuse, true);
   taken = result == platform::CommitResult::Taken;
   if (result == platform::CommitResult::Done && hidden) (void)platform::SetHidden(path, true);
@@ -140,11 +148,14 @@ std::string VolumeKeyFor(const std::string& path) {
   if (!volume.available) return "Unknown";
   std::string suffix(1, ':');
   suffix += std::to_string(volume.serial);
-  return volume.label.size() + suffix.size() < kTextSize - 1 ? volume.label + suffix : volume.label.substr(0, kTextSize - 1);
+  return volume.label.size() + suffix.size() < kTextSize - 1
+             ? volume.label + suffix
+             : volume.label.substr(0, kTextSize - 1);
 }
 
 bool PurgesMissing(const DatabaseKey& key) {
-  // The volume of the nearest folder that is there: of a drive that is not plugged in, another one's.
+  // The volume of the nearest folder that is there: of a drive that is not plugged in, another
+  // one's.
   std::string nearest = key.path;
   while (platform::FactsOf(nearest).kind == platform::FileKind::Missing) {
     const platform::PathParts parts = platform::SplitPath(nearest);
@@ -154,15 +165,16 @@ bool PurgesMissing(const DatabaseKey& key) {
     nearest = std::move(folder);
   }
   const platform::DriveKind kind = platform::VolumeOf(nearest).kind;
-  return kind != platform::DriveKind::Network && kind != platform::DriveKind::Optical && kind != platform::DriveKind::Removable &&
-         VolumeKeyFor(nearest) == key.volume;
+  return kind != platform::DriveKind::Network && kind != platform::DriveKind::Optical &&
+         kind != platform::DriveKind::Removable && VolumeKeyFor(nearest) == key.volume;
 }
 
 std::string ThumbnailDatabasePath(const std::string& folder) {
   return folder.empty() ? DataFile(kDatabaseName) : platform::JoinFolder(folder, kDatabaseName);
 }
 
-ThumbnailDatabase::Opened ThumbnailDatabase::OpenThumbnailDatabase(const std::string& path, bool create, bool hidden) {
+ThumbnailDatabase::Opened ThumbnailDatabase::OpenThumbnailDatabase(const std::string& path,
+                                                                   bool create, bool hidden) {
   using platform::StoreFile;
   CloseThumbnailDatabase();
   path_ = path;
@@ -183,7 +195,8 @@ ThumbnailDatabase::Opened ThumbnailDatabase::OpenThumbnailDatabase(const std::st
 void ThumbnailDatabase::CloseThumbnailDatabase() {
   // Only of a file that is still as the index knows it.
   const bool worthSaving = file_.IsOpen() && indexed_.count >= kLargeIndex && indexed_ != saved_;
-  if (worthSaving && indexed_.size == file_.Size() && indexed_.modified == file_.Modified() && file_.IsStill(path_)) {
+  if (worthSaving && indexed_.size == file_.Size() && indexed_.modified == file_.Modified() &&
+      file_.IsStill(path_)) {
     index_.Save(IndexPath(path_), indexed_);
     if (hidden_) (void)platform::SetHidden(IndexPath(path_), true);
   }
@@ -193,13 +206,17 @@ void ThumbnailDatabase::CloseThumbnailDatabase() {
   triedFile_ = false;
 }
 
-bool ThumbnailDatabase::ReadDatabaseHeader(DatabaseHeader& header) const { return ReadHeaderOf(file_, header); }
+bool ThumbnailDatabase::ReadDatabaseHeader(DatabaseHeader& header) const {
+  return ReadHeaderOf(file_, header);
+}
 
 bool ThumbnailDatabase::WriteDatabaseHeader(const DatabaseHeader& header) {
   return file_.WriteAt(0, BytesOf(header)) && file_.Sync();
 }
 
-int64_t ThumbnailDatabase::RecordCount(const DatabaseHeader& header) const { return RecordsIn(header, file_.Size()); }
+int64_t ThumbnailDatabase::RecordCount(const DatabaseHeader& header) const {
+  return RecordsIn(header, file_.Size());
+}
 
 bool ThumbnailDatabase::ReadDatabaseRecord(int64_t index, DatabaseRecord& record) const {
   KeyBytes key;
@@ -208,18 +225,22 @@ bool ThumbnailDatabase::ReadDatabaseRecord(int64_t index, DatabaseRecord& record
   return record.thumbnail.HasMagic(kSmallThumbnailMagic);
 }
 
-bool ThumbnailDatabase::ReadKey(int64_t index, DatabaseKey& key) const { return TryKey(index, key) == KeyRead::Done; }
+bool ThumbnailDatabase::ReadKey(int64_t index, DatabaseKey& key) const {
+  return TryKey(index, key) == KeyRead::Done;
+}
 
 ThumbnailDatabase::KeyRead ThumbnailDatabase::TryKey(int64_t index, DatabaseKey& key) const {
   std::array<uint8_t, kSmallThumbnailMagic.size()> magic;
   std::array<uint8_t, kKeySize> bytes;
-  const bool read = index >= 0 && file_.ReadAt(OffsetOf(index), magic) && file_.ReadAt(OffsetOf(index) + kPathOffset, bytes);
+  const bool read = index >= 0 && file_.ReadAt(OffsetOf(index), magic) &&
+                    file_.ReadAt(OffsetOf(index) + kPathOffset, bytes);
   if (!read) return KeyRead::Failed;
   TakeKey(std::span<const uint8_t>(bytes), key);
   return ByteReader(magic).Match(kSmallThumbnailMagic) ? KeyRead::Done : KeyRead::NoThumbnail;
 }
 
-// Takes the lock; where another process has put a new file in the old one's place meanwhile, that of the new one.
+// Takes the lock; where another process has put a new file in the old one's place meanwhile, that
+// of the new one.
 bool ThumbnailDatabase::LockAndCheck(DatabaseHeader& header) {
   while (file_.Lock()) {
     if (file_.IsStill(path_)) {
@@ -238,8 +259,8 @@ ThumbnailIndex::State ThumbnailDatabase::StateOf(const DatabaseHeader& header) c
   return {RecordsIn(header, size), size, file_.Modified()};
 }
 
-// Has the index know the file as it is. False when a record could not be read; the index then lacks it, and is made again
-// the next time.
+// Has the index know the file as it is. False when a record could not be read; the index then lacks
+// it, and is made again the next time.
 bool ThumbnailDatabase::UpdateIndex(const ThumbnailIndex::State& state) {
   if (indexed_ == state) return true;
   indexed_ = {};
@@ -259,7 +280,8 @@ bool ThumbnailDatabase::BuildIndex(int64_t count) {
   bool complete = count == 0 || file_.ReadAt(OffsetOf(0), nextMagic);
   for (int64_t i = 0; i < count; ++i) {
     const bool thumbnail = ByteReader(nextMagic).Match(kSmallThumbnailMagic);
-    const std::span<uint8_t> wanted = std::span(bytes).first(i + 1 < count ? bytes.size() : kKeySize);
+    const std::span<uint8_t> wanted =
+        std::span(bytes).first(i + 1 < count ? bytes.size() : kKeySize);
     const bool read = file_.ReadAt(OffsetOf(i) + kPathOffset, wanted);
     complete = complete && read;
     const bool deleted = (bytes[kFlagsOffset - kPathOffset] & kDeletedFlag) != 0;
@@ -275,8 +297,8 @@ bool ThumbnailDatabase::MarkDeleted(int64_t index) {
   return file_.WriteAt(OffsetOf(index) + kFlagsOffset, {&flags, 1});
 }
 
-// The records of the same paths and volumes as new ones, which are to be from `first` on: those that are there, and new
-// ones that come again further on. False when one cannot be read.
+// The records of the same paths and volumes as new ones, which are to be from `first` on: those
+// that are there, and new ones that come again further on. False when one cannot be read.
 bool ThumbnailDatabase::FindRecordsToReplace(std::span<const DatabaseRecord> records, int64_t first,
                                              std::vector<int64_t>& replaced) const {
   std::map<std::pair<std::string_view, std::string_view>, int64_t> added;
@@ -290,7 +312,8 @@ bool ThumbnailDatabase::FindRecordsToReplace(std::span<const DatabaseRecord> rec
     }
     const bool failed = index_.Find(ThumbnailIndex::HashOf(records[i].path), [&](size_t index) {
       const KeyRead read = TryKey(static_cast<int64_t>(index), key);
-      const bool wanted = read == KeyRead::Done && !key.deleted && key.path == records[i].path && key.volume == records[i].volume;
+      const bool wanted = read == KeyRead::Done && !key.deleted && key.path == records[i].path &&
+                          key.volume == records[i].volume;
       if (wanted) replaced.push_back(static_cast<int64_t>(index));
       return read == KeyRead::Failed;
     });
@@ -302,17 +325,20 @@ bool ThumbnailDatabase::FindRecordsToReplace(std::span<const DatabaseRecord> rec
 bool ThumbnailDatabase::WriteRecords(std::span<const DatabaseRecord> records, int64_t first) {
   KeyBytes key;
   for (const DatabaseRecord& record : records) {
-    if (!BytesOf(record, key) || !file_.WriteAt(OffsetOf(first++), record.thumbnail.bytes, key)) return false;
+    if (!BytesOf(record, key) || !file_.WriteAt(OffsetOf(first++), record.thumbnail.bytes, key))
+      return false;
   }
   return file_.Sync();
 }
 
-bool ThumbnailDatabase::AppendDatabaseRecords(std::span<const DatabaseRecord> records, bool replace) {
+bool ThumbnailDatabase::AppendDatabaseRecords(std::span<const DatabaseRecord> records,
+                                              bool replace) {
   DatabaseHeader header;
   if (!LockAndCheck(header)) return false;
   const Unlocker unlocker(file_);
   const int64_t first = header.count;
-  if (first != RecordCount(header) || INT32_MAX - first < static_cast<int64_t>(records.size())) return false;
+  if (first != RecordCount(header) || INT32_MAX - first < static_cast<int64_t>(records.size()))
+    return false;
   if (replace && !UpdateIndex(StateOf(header))) return false;
   const bool indexed = indexed_ == StateOf(header);
   indexed_ = {};  // until all is done
@@ -348,19 +374,27 @@ bool ThumbnailDatabase::WriteDatabaseRecord(int64_t index, const DatabaseRecord&
   return true;
 }
 
-bool ThumbnailDatabase::Find(const std::string& path, const std::string& volume, ThumbnailRecord& thumbnail) {
+bool ThumbnailDatabase::Find(const std::string& path, const std::string& volume,
+                             ThumbnailRecord& thumbnail) {
   ThumbnailIndex::State state;
   DatabaseHeader header;
   if (!file_.IsStill(path_, state.size, state.modified)) {  // it was compacted meanwhile
-    if (OpenThumbnailDatabase(path_, false, hidden_) != Opened::Done || !file_.IsStill(path_, state.size, state.modified)) return false;
+    if (OpenThumbnailDatabase(path_, false, hidden_) != Opened::Done ||
+        !file_.IsStill(path_, state.size, state.modified))
+      return false;
   }
   if (!ReadDatabaseHeader(header)) return false;
   state.count = RecordsIn(header, state.size);
   const uint32_t hash = ThumbnailIndex::HashOf(path);
-  const auto isIt = [&](size_t index) { return TakeThumbnail(static_cast<int64_t>(index), path, volume, thumbnail); };
-  // The first lookup after opening asks the saved index for this one; only the next is worth loading it.
+  const auto isIt = [&](size_t index) {
+    return TakeThumbnail(static_cast<int64_t>(index), path, volume, thumbnail);
+  };
+  // The first lookup after opening asks the saved index for this one; only the next is worth
+  // loading it.
   if (state != indexed_ && state.count >= kLargeIndex && !std::exchange(triedFile_, true)) {
-    if (const std::optional<bool> found = ThumbnailIndex::FindInFile(IndexPath(path_), state, hash, isIt)) return *found;
+    if (const std::optional<bool> found =
+            ThumbnailIndex::FindInFile(IndexPath(path_), state, hash, isIt))
+      return *found;
   }
   (void)UpdateIndex(state);  // what cannot be read is passed over
   return index_.Find(hash, isIt);
@@ -371,7 +405,9 @@ bool ThumbnailDatabase::TakeThumbnail(int64_t index, std::string_view path, std:
                                       ThumbnailRecord& thumbnail) const {
   KeyBytes bytes;
   DatabaseKey key;
-  if (!file_.ReadAt(OffsetOf(index), thumbnail.bytes, bytes) || !thumbnail.HasMagic(kSmallThumbnailMagic)) return false;
+  if (!file_.ReadAt(OffsetOf(index), thumbnail.bytes, bytes) ||
+      !thumbnail.HasMagic(kSmallThumbnailMagic))
+    return false;
   TakeKey(bytes, key);
   return !key.deleted && key.volume == volume && ComparisonKey(key.path) == ComparisonKey(path);
 }
@@ -399,21 +435,27 @@ int64_t ThumbnailDatabase::Delete(const std::string& path) {
   return static_cast<int64_t>(deleted.size());
 }
 
-ThumbnailDatabase::Compacted ThumbnailDatabase::CopyLiveRecords(platform::StoreFile& to, DatabaseHeader header, bool purge,
-                                                                ProgressSink* progress, const StopToken& stop) {
+ThumbnailDatabase::Compacted ThumbnailDatabase::CopyLiveRecords(platform::StoreFile& to,
+                                                                DatabaseHeader header, bool purge,
+                                                                ProgressSink* progress,
+                                                                const StopToken& stop) {
   const int32_t count = header.count;
   header.count = 0;
-  // The header comes first, so that what an interrupted pass leaves is known as ours by its first bytes.
+  // The header comes first, so that what an interrupted pass leaves is known as ours by its first
+  // bytes.
   if (!to.WriteAt(0, BytesOf(header))) return Compacted::Failed;
   std::vector<uint8_t> bytes(kDatabaseRecordSize);
   for (int32_t i = 0; i < count; ++i) {
     if (progress != nullptr) progress->Step(i, count);
     if (stop.Asked()) return Compacted::Stopped;
-    if (!file_.ReadAt(OffsetOf(i), bytes) || !ByteReader(bytes).Match(kSmallThumbnailMagic)) return Compacted::NotRead;
+    if (!file_.ReadAt(OffsetOf(i), bytes) || !ByteReader(bytes).Match(kSmallThumbnailMagic))
+      return Compacted::NotRead;
     DatabaseKey key;
     TakeKey(std::span<const uint8_t>(bytes).subspan(kPathOffset), key);
     if (key.deleted) continue;
-    if (purge && platform::FactsOf(key.path).kind == platform::FileKind::Missing && PurgesMissing(key)) continue;
+    if (purge && platform::FactsOf(key.path).kind == platform::FileKind::Missing &&
+        PurgesMissing(key))
+      continue;
     if (!to.WriteAt(OffsetOf(header.count), bytes)) return Compacted::Failed;
     ++header.count;
   }
@@ -421,14 +463,17 @@ ThumbnailDatabase::Compacted ThumbnailDatabase::CopyLiveRecords(platform::StoreF
   return to.WriteAt(0, BytesOf(header)) && to.Sync() ? Compacted::Done : Compacted::Failed;
 }
 
-ThumbnailDatabase::Compacted ThumbnailDatabase::CompactThumbnailDatabase(bool purge, ProgressSink* progress,
+ThumbnailDatabase::Compacted ThumbnailDatabase::CompactThumbnailDatabase(bool purge,
+                                                                         ProgressSink* progress,
                                                                          const StopToken& stop) {
   const Compacted result = CompactLocked(purge, progress, stop);
-  if (result == Compacted::Done && OpenThumbnailDatabase(path_, false, hidden_) != Opened::Done) return Compacted::NotRead;
+  if (result == Compacted::Done && OpenThumbnailDatabase(path_, false, hidden_) != Opened::Done)
+    return Compacted::NotRead;
   return result;
 }
 
-ThumbnailDatabase::Compacted ThumbnailDatabase::CompactLocked(bool purge, ProgressSink* progress, const StopToken& stop) {
+ThumbnailDatabase::Compacted ThumbnailDatabase::CompactLocked(bool purge, ProgressSink* progress,
+                                                              const StopToken& stop) {
   using platform::StoreFile;
   DatabaseHeader header;
   if (!LockAndCheck(header)) return Compacted::NotRead;
@@ -437,10 +482,11 @@ ThumbnailDatabase::Compacted ThumbnailDatabase::CompactLocked(bool purge, Progre
   const std::string copy = path_ + ".BAK";
   if (IsLeftover(copy) && !platform::DeleteFile(copy)) return Compacted::Failed;
   StoreFile to;
-  if (to.Open(copy, StoreFile::Mode::CreateNew) != StoreFile::OpenResult::Done) return Compacted::Failed;
+  if (to.Open(copy, StoreFile::Mode::CreateNew) != StoreFile::OpenResult::Done)
+    return Compacted::Failed;
   Compacted result = CopyLiveRecords(to, header, purge, progress, stop);
-  if (result == Compacted::Done &&
-      platform::RenameFile(copy, path_, platform::Existing::Replace) != platform::CommitResult::Done) {
+  if (result == Compacted::Done && platform::RenameFile(copy, path_, platform::Existing::Replace) !=
+                                       platform::CommitResult::Done) {
     result = Compacted::Failed;
   }
   to.Close();
@@ -452,14 +498,18 @@ ThumbnailDatabase::Compacted ThumbnailDatabase::CompactLocked(bool purge, Progre
   return result;
 }
 
-bool FindDatabaseThumbnail(ThumbnailRecord& thumbnail, const std::string& path, const std::string& databasePath) {
+bool FindDatabaseThumbnail(ThumbnailRecord& thumbnail, const std::string& path,
+                           const std::string& databasePath) {
   platform::StoreFile file;
   DatabaseHeader header;
   std::vector<uint8_t> bytes(kDatabaseRecordSize);
-  if (file.Open(databasePath, platform::StoreFile::Mode::Read) != platform::StoreFile::OpenResult::Done) return false;
+  if (file.Open(databasePath, platform::StoreFile::Mode::Read) !=
+      platform::StoreFile::OpenResult::Done)
+    return false;
   if (!ReadHeaderOf(file, header)) return false;
   for (int64_t i = 0; i < header.count; ++i) {
-    if (!file.ReadAt(OffsetOf(i), bytes) || !ByteReader(bytes).Match(kSmallThumbnailMagic)) return false;
+    if (!file.ReadAt(OffsetOf(i), bytes) || !ByteReader(bytes).Match(kSmallThumbnailMagic))
+      return false;
     if (TextViewIn(std::span(bytes).subspan(kPathOffset)) != path) continue;
     std::copy_n(bytes.begin(), thumbnail.bytes.size(), thumbnail.bytes.begin());
     return true;

@@ -32,8 +32,8 @@ namespace fotomill {
 //            28434    1  flags: bit 0 set, the record is deleted
 //            28435    7  0
 //
-// The global database is in the data folder, a local one in the folder of its pictures. A record is written and on disk
-// before the header counts it; what is behind the counted ones means nothing.
+// The global database is in the data folder, a local one in the folder of its pictures. A record is
+// written and on disk before the header counts it; what is behind the counted ones means nothing.
 inline constexpr size_t kDatabaseHeaderSize = 60;
 inline constexpr size_t kDatabaseRecordSize = 28442;  // bytes
 inline constexpr std::string_view kDatabaseMagic = "BRNTTDBX";  // at the start of the file
@@ -61,24 +61,26 @@ struct DatabaseKey {
   bool deleted = false;
 };
 
-// Key of the volume that holds a path: its label and serial number as "LABEL:12345", the label alone when both are too
-// long; "Unknown" when it is not available.
+// Key of the volume that holds a path: its label and serial number as "LABEL:12345", the label
+// alone when both are too long; "Unknown" when it is not available.
 std::string VolumeKeyFor(const std::string& path);
 
-// Whether compaction tests a picture for existence: not on network, optical and removable drives, nor where another volume
-// than the record's lies now.
+// Whether compaction tests a picture for existence: not on network, optical and removable drives,
+// nor where another volume than the record's lies now.
 bool PurgesMissing(const DatabaseKey& key);
 
-// The database of a folder; of an empty one the global database, whose path is empty where there is no data folder.
+// The database of a folder; of an empty one the global database, whose path is empty where there is
+// no data folder.
 std::string ThumbnailDatabasePath(const std::string& folder);
 
-// What all browsers share: with kCompareExtensions, pictures that differ in their extension only are two.
+// What all browsers share: with kCompareExtensions, pictures that differ in their extension only
+// are two.
 inline constexpr uint8_t kCompareExtensions = 1;
 inline std::atomic<uint8_t> browserOptions{kCompareExtensions};
 
-// One open database. Every change holds the file's lock, so that several processes may append at once. Lookups and
-// appends do not take longer the more records there are: an index, kept between runs in "PATH.index", says where to look.
-// An object is used by one thread at a time.
+// One open database. Every change holds the file's lock, so that several processes may append at
+// once. Lookups and appends do not take longer the more records there are: an index, kept between
+// runs in "PATH.index", says where to look. An object is used by one thread at a time.
 class ThumbnailDatabase {
  public:
   ThumbnailDatabase() = default;
@@ -93,8 +95,8 @@ class ThumbnailDatabase {
     NotRead,  // it cannot be opened, or is none: it was left alone
     Failed,   // it could not be made
   };
-  // Opens the database of that path; with `create`, one that is missing is made with an empty header. With `hidden`
-  // what is made, now or later, is hidden.
+  // Opens the database of that path; with `create`, one that is missing is made with an empty
+  // header. With `hidden` what is made, now or later, is hidden.
   Opened OpenThumbnailDatabase(const std::string& path, bool create, bool hidden = true);
   void CloseThumbnailDatabase();  // does nothing when none is open
 
@@ -107,17 +109,20 @@ class ThumbnailDatabase {
   // The same without the thumbnail's pixels.
   bool ReadKey(int64_t index, DatabaseKey& key) const;
 
-  // Appends records and has them on disk. Earlier ones of the same path and volume, if any are to be `replaced`, are then
-  // marked deleted. False when they could not all be written, or the header counts more than the file holds; the file
-  // then has no more records than before.
+  // Appends records and has them on disk. Earlier ones of the same path and volume, if any are to
+  // be `replaced`, are then marked deleted. False when they could not all be written, or the header
+  // counts more than the file holds; the file then has no more records than before.
   bool AppendDatabaseRecords(std::span<const DatabaseRecord> records, bool replace);
-  bool AppendDatabaseRecord(const DatabaseRecord& record) { return AppendDatabaseRecords({&record, 1}, false); }
+  bool AppendDatabaseRecord(const DatabaseRecord& record) {
+    return AppendDatabaseRecords({&record, 1}, false);
+  }
   // Puts a record in the place of one that is counted, and has it on disk.
   bool WriteDatabaseRecord(int64_t index, const DatabaseRecord& record);
-  // The thumbnail of the first record that is not deleted, of that path and volume. False if there is none; `thumbnail`
-  // may then hold anything.
+  // The thumbnail of the first record that is not deleted, of that path and volume. False if there
+  // is none; `thumbnail` may then hold anything.
   bool Find(const std::string& path, const std::string& volume, ThumbnailRecord& thumbnail);
-  // Marks every record of a path deleted, whatever its volume; how many there were, -1 when it could not be done.
+  // Marks every record of a path deleted, whatever its volume; how many there were, -1 when it
+  // could not be done.
   int64_t Delete(const std::string& path);
 
   // What became of a compaction.
@@ -127,8 +132,8 @@ class ThumbnailDatabase {
     Failed,   // the new file could not be written
     Stopped,  // asked to stop
   };
-  // Copies what is not deleted (and with `purgeMissing`, whose picture is there) into "PATH.BAK", which then takes the
-  // database's place in one step. Otherwise the database stays as it was.
+  // Copies what is not deleted (and with `purgeMissing`, whose picture is there) into "PATH.BAK",
+  // which then takes the database's place in one step. Otherwise the database stays as it was.
   Compacted CompactThumbnailDatabase(bool purgeMissing, ProgressSink* progress = nullptr,
                                      const StopToken& stop = {});
 
@@ -138,27 +143,31 @@ class ThumbnailDatabase {
   bool LockAndCheck(DatabaseHeader& header);
   ThumbnailIndex::State StateOf(const DatabaseHeader& header) const;
   bool UpdateIndex(const ThumbnailIndex::State& state);
-  bool TakeThumbnail(int64_t index, std::string_view path, std::string_view volume, ThumbnailRecord& thumbnail) const;
+  bool TakeThumbnail(int64_t index, std::string_view path, std::string_view volume,
+                     ThumbnailRecord& thumbnail) const;
   bool BuildIndex(int64_t count);
-  bool FindRecordsToReplace(std::span<const DatabaseRecord> records, int64_t first, std::vector<int64_t>& replaced) const;
+  bool FindRecordsToReplace(std::span<const DatabaseRecord> records, int64_t first,
+                            std::vector<int64_t>& replaced) const;
   bool WriteRecords(std::span<const DatabaseRecord> records, int64_t first);
   bool WriteDatabaseHeader(const DatabaseHeader& header);
   bool MarkDeleted(int64_t index);
   Compacted CompactLocked(bool purge, ProgressSink* progress, const StopToken& stop);
-  Compacted CopyLiveRecords(platform::StoreFile& to, DatabaseHeader header, bool purge, ProgressSink* progress,
-                            const StopToken& stop);
+  Compacted CopyLiveRecords(platform::StoreFile& to, DatabaseHeader header, bool purge,
+                            ProgressSink* progress, const StopToken& stop);
 
   std::string path_;
   bool hidden_ = false;
   platform::StoreFile file_;
   ThumbnailIndex index_;
-  ThumbnailIndex::State indexed_;  // the file as the index knows it: in another state, someone else has changed it
+  // the file as the index knows it: in another state, someone else has changed it
+  ThumbnailIndex::State indexed_;
   ThumbnailIndex::State saved_;    // as the saved index knows it
   bool triedFile_ = false;         // the saved index was asked for a lookup
 };
 
-// The thumbnail of the first record of exactly that path in a database, deleted or not and on whatever volume. False as
-// well when a record before it cannot be read.
-bool FindDatabaseThumbnail(ThumbnailRecord& thumbnail, const std::string& path, const std::string& databasePath);
+// The thumbnail of the first record of exactly that path in a database, deleted or not and on
+// whatever volume. False as well when a record before it cannot be read.
+bool FindDatabaseThumbnail(ThumbnailRecord& thumbnail, const std::string& path,
+                           const std::string& databasePath);
 
 }  // namespace fotomill

@@ -21,8 +21,8 @@ void TurnGray(PackedImage& bitmap) {
   }
 }
 
-// How much of each old pixel, of `from`, a new one of `to` covers, in parts of which an old pixel has `to` and a new
-// one `from`.
+// How much of each old pixel, of `from`, a new one of `to` covers, in parts of which an old pixel
+// has `to` and a new one `from`.
 struct Covered {
   int32_t first, count;
   int32_t Weight(int32_t old, int32_t to, int32_t from, int32_t made) const {
@@ -52,7 +52,8 @@ Status Stretch(const PackedImage& bitmap, int32_t side, PackedImage& stretched) 
         }
       }
       uint8_t* const pixel = &stretched.StoredRow(r)[static_cast<size_t>(c) * 3];
-      for (int32_t i = 0; i < 3; ++i) pixel[i] = static_cast<uint8_t>((sums[i] + from * from / 2) / (from * from));
+      for (int32_t i = 0; i < 3; ++i)
+        pixel[i] = static_cast<uint8_t>((sums[i] + from * from / 2) / (from * from));
     }
   }
   return Status::Ok;
@@ -63,7 +64,8 @@ Status Resample(const PackedImage& bitmap, int32_t side, int32_t filter, PackedI
   return ScaleFiltered(bitmap, {}, {side, side}, ScaleFilterFromKey(filter), scaled, noAlpha);
 }
 
-Status MakeDrawnBitmap(const AnyThumbnailRecord& record, uint32_t flags, const ThumbnailOptions& options, PackedImage& bitmap) {
+Status MakeDrawnBitmap(const AnyThumbnailRecord& record, uint32_t flags,
+                       const ThumbnailOptions& options, PackedImage& bitmap) {
   RETURN_IF_BAD(std::visit([&](const auto& held) { return ThumbnailRecordToBitmap(held, bitmap); }, record));
   if ((flags & kDrawGray) != 0) TurnGray(bitmap);
   const int32_t side = DrawnThumbnailSide(record, flags);
@@ -76,12 +78,15 @@ Status MakeDrawnBitmap(const AnyThumbnailRecord& record, uint32_t flags, const T
 }
 
 void CopyClipped(const PackedImage& from, PackedImage& to, int32_t x, int32_t y) {
-  const int64_t left = std::max<int64_t>(x, 0), right = std::min<int64_t>(int64_t{x} + from.Width(), to.Width());
-  const int64_t top = std::max<int64_t>(y, 0), bottom = std::min<int64_t>(int64_t{y} + from.Height(), to.Height());
+  const int64_t left = std::max<int64_t>(x, 0),
+                right = std::min<int64_t>(int64_t{x} + from.Width(), to.Width());
+  const int64_t top = std::max<int64_t>(y, 0),
+                bottom = std::min<int64_t>(int64_t{y} + from.Height(), to.Height());
   if (left >= right) return;
   for (int64_t row = top; row < bottom; ++row) {
     const uint8_t* const source = from.Row(static_cast<int32_t>(row - y)).data() + 3 * (left - x);
-    std::memcpy(to.Row(static_cast<int32_t>(row)).data() + 3 * left, source, static_cast<size_t>(3 * (right - left)));
+    std::memcpy(to.Row(static_cast<int32_t>(row)).data() + 3 * left, source,
+                static_cast<size_t>(3 * (right - left)));
   }
 }
 
@@ -90,13 +95,15 @@ void CopyClipped(const PackedImage& from, PackedImage& to, int32_t x, int32_t y)
 int32_t DrawnThumbnailSide(const AnyThumbnailRecord& record, uint32_t flags) {
   if ((flags & kDrawLargeView) != 0) return kLargeThumbnailSide;
   if ((flags & kDrawHalfSize) != 0) return kHalfSide;
-  return std::holds_alternative<LargeThumbnailRecord>(record) ? kLargeThumbnailSide : kSmallThumbnailSide;
+  return std::holds_alternative<LargeThumbnailRecord>(record) ? kLargeThumbnailSide
+                                                              : kSmallThumbnailSide;
 }
 
-bool DrawThumbnailRecord(PackedImage& bitmap, const AnyThumbnailRecord& record, int32_t x, int32_t y, uint32_t flags,
-                         const ThumbnailOptions& options) {
+bool DrawThumbnailRecord(PackedImage& bitmap, const AnyThumbnailRecord& record, int32_t x,
+                         int32_t y, uint32_t flags, const ThumbnailOptions& options) {
   PackedImage drawn;
-  if (bitmap.Bits() != 24 || MakeDrawnBitmap(record, flags, options, drawn) != Status::Ok) return false;
+  if (bitmap.Bits() != 24 || MakeDrawnBitmap(record, flags, options, drawn) != Status::Ok)
+    return false;
   CopyClipped(drawn, bitmap, x, y);
   return true;
 }

@@ -21,15 +21,15 @@ inline constexpr uint32_t kDrawGray = 8;
 // Edge of the square that a record fills when it is drawn.
 int32_t DrawnThumbnailSide(const AnyThumbnailRecord& record, uint32_t flags);
 
-// Draws a record into a 24-bit bitmap, the square's top left corner at column x, row y from the top; what is outside
-// the bitmap is left out. A small record is enlarged for the large view with the filter of the options, or by
-// spreading its pixels. False without memory, or when the bitmap has another depth; it is then
-// as before.
-bool DrawThumbnailRecord(PackedImage& bitmap, const AnyThumbnailRecord& record, int32_t x, int32_t y, uint32_t flags,
-                         const ThumbnailOptions& options);
+// Draws a record into a 24-bit bitmap, the square's top left corner at column x, row y from the
+// top; what is outside the bitmap is left out. A small record is enlarged for the large view with
+// the filter of the options, or by spreading its pixels. False without memory, or when the bitmap
+// has another depth; it is then as before.
+bool DrawThumbnailRecord(PackedImage& bitmap, const AnyThumbnailRecord& record, int32_t x,
+                         int32_t y, uint32_t flags, const ThumbnailOptions& options);
 
-// Fills a record with one of the two pictures that stand for a thumbnail that is not there: 9501, one can still be
-// made; 9502, none can. False for another number.
+// Fills a record with one of the two pictures that stand for a thumbnail that is not there: 9501,
+// one can still be made; 9502, none can. False for another number.
 inline constexpr int32_t kPlaceholderNotMade = 9501;
 inline constexpr int32_t kPlaceholderUnreadable = 9502;  // none can be made
 // `which`: one of the two numbers above.

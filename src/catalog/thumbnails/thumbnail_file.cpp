@@ -21,7 +21,8 @@ bool WriteRecord(const ThumbnailRecord& record, const std::string& path) {
          file.Commit(platform::Existing::Replace) == platform::CommitResult::Done;
 }
 
-// The bytes of a file that a record can take, the rest zero; how many there were, 0 when it cannot be read.
+// The bytes of a file that a record can take, the rest zero; how many there were, 0 when it cannot
+// be read.
 size_t ReadRecord(const std::string& path, ThumbnailRecord& record) {
   platform::FileView file;
   if (!file.OpenHead(path.c_str(), record.bytes.size())) return 0;
@@ -58,36 +59,45 @@ bool ReadThumbnailForPicture(const std::string& picturePath, ThumbnailRecord& re
 bool WriteThumbnailFile(ThumbnailRecord& record, const std::string& path, bool hidden) {
   record.Sign();
   const platform::FileFacts facts = platform::FactsOf(path);
-  if (facts.kind == platform::FileKind::Regular && !facts.link && !platform::SetNormal(path)) return false;
+  if (facts.kind == platform::FileKind::Regular && !facts.link && !platform::SetNormal(path))
+    return false;
   if (!WriteRecord(record, path)) return false;
   if (hidden) (void)platform::SetHidden(path, true);  // seen or not, it is there
   return true;
 }
 
-bool WriteThumbnailForPicture(const std::string& picturePath, const PictureRecord& picture, Color background) {
+bool WriteThumbnailForPicture(const std::string& picturePath, const PictureRecord& picture,
+                              Color background) {
   ThumbnailRecord record;
-  return MakeBlendedThumbnailRecord(record, picture, background) && WriteRecord(record, ThumbnailPathFor(picturePath));
+  return MakeBlendedThumbnailRecord(record, picture, background) &&
+         WriteRecord(record, ThumbnailPathFor(picturePath));
 }
 
-Status MakeThumbnailOfFile(const std::string& picturePath, const ThumbnailOptions& options, ThumbnailRecord& record) {
+Status MakeThumbnailOfFile(const std::string& picturePath, const ThumbnailOptions& options,
+                           ThumbnailRecord& record) {
   PicturePointer picture;
   // The quick scaler's result depends on the size that it starts from.
   const int32_t side = options.quick ? 0 : kSmallThumbnailSide;
   RETURN_IF_BAD(LoadPicture({.fileName = picturePath, .thumbnailSide = side, .options = options.read}, picture));
   if (picture->image.Empty()) return Status::EmptyImage;
-  return MakeThumbnailRecord(record, *picture, options) ? Status::Ok : Status::MemoryAllocationError;
+  return MakeThumbnailRecord(record, *picture, options) ? Status::Ok
+                                                        : Status::MemoryAllocationError;
 }
 
-std::optional<std::vector<std::string>> OrphanThumbnails(const std::string& folder, const std::vector<std::string>& names) {
+std::optional<std::vector<std::string>> OrphanThumbnails(const std::string& folder,
+                                                         const std::vector<std::string>& names) {
   const auto entries = platform::ListFolder(folder);
   if (!entries) return std::nullopt;
   std::set<std::string> owned;
-  for (const std::string& name : names) owned.insert(LowerCase(ThumbnailPathFor(platform::FileNameOf(name))));
+  for (const std::string& name : names)
+    owned.insert(LowerCase(ThumbnailPathFor(platform::FileNameOf(name))));
   std::vector<std::string> orphans;
   for (const platform::FolderEntry& entry : *entries) {
-    const bool thumbnail = entry.kind == platform::FileKind::Regular && !entry.link && !entry.name.starts_with('.') &&
-                           EqualIgnoringCase(platform::SplitPath(entry.name).extension, kThumbnailExtension);
-    if (thumbnail && !owned.contains(LowerCase(entry.name))) orphans.push_back(platform::JoinFolder(folder, entry.name));
+    const bool thumbnail =
+        entry.kind == platform::FileKind::Regular && !entry.link && !entry.name.starts_with('.') &&
+        EqualIgnoringCase(platform::SplitPath(entry.name).extension, kThumbnailExtension);
+    if (thumbnail && !owned.contains(LowerCase(entry.name)))
+      orphans.push_back(platform::JoinFolder(folder, entry.name));
   }
   return orphans;
 }

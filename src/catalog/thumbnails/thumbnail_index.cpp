@@ -15,7 +15,8 @@ namespace {
 
 constexpr std::string_view kMagic = "FMTDBIX1";
 constexpr size_t kHeadSize = 48, kBlockSize = 512, kCellSize = 8;
-constexpr size_t kCellsInBlock = kBlockSize / kCellSize - 1, kCellsUsed = 40;  // on an average; what is free ends a search
+// on an average; what is free ends a search
+constexpr size_t kCellsInBlock = kBlockSize / kCellSize - 1, kCellsUsed = 40;
 constexpr size_t kSmallestTable = 1024;                                        // cells
 constexpr uint64_t kFactor = 0x9E3779B97F4A7C15;
 
@@ -57,12 +58,15 @@ HeadBytes BytesOf(const ThumbnailIndex::State& state, uint64_t blocks) {
 }
 
 // False unless these are the bytes of that state.
-bool ReadHead(std::span<const uint8_t, kHeadSize> bytes, const ThumbnailIndex::State& state, Head& head) {
+bool ReadHead(std::span<const uint8_t, kHeadSize> bytes, const ThumbnailIndex::State& state,
+              Head& head) {
   head = {WordAt(&bytes[32]), WordAt(&bytes[40])};
   return std::ranges::equal(bytes, BytesOf(state, head.blocks)) && head.blocks > 0;
 }
 
-uint64_t HomeBlock(uint32_t hash, uint64_t blocks) { return static_cast<uint64_t>(hash) * blocks >> 32; }
+uint64_t HomeBlock(uint32_t hash, uint64_t blocks) {
+  return static_cast<uint64_t>(hash) * blocks >> 32;
+}
 
 uint64_t BlockChecksum(const uint8_t* block, uint64_t number, const Head& head) {
   return ChecksumOf({block + 8, kBlockSize - 8}, head.checksum + number * kFactor);
@@ -77,11 +81,13 @@ Cell CellAt(const uint8_t* block, size_t place) {
   return {static_cast<uint32_t>(word), static_cast<uint32_t>(word >> 32)};
 }
 
-// Whether a name may be taken for an index: there is an older one, or nothing yet. The file is then open.
+// Whether a name may be taken for an index: there is an older one, or nothing yet. The file is then
+// open.
 bool OpenForSaving(const std::string& path, platform::StoreFile& file) {
   using platform::StoreFile;
   const StoreFile::OpenResult result = file.Open(path, StoreFile::Mode::ReadWrite);
-  if (result == StoreFile::OpenResult::Missing) return file.Open(path, StoreFile::Mode::CreateNew) == StoreFile::OpenResult::Done;
+  if (result == StoreFile::OpenResult::Missing)
+    return file.Open(path, StoreFile::Mode::CreateNew) == StoreFile::OpenResult::Done;
   std::vector<uint8_t> magic(kMagic.size());
   return result == StoreFile::OpenResult::Done &&
          (file.Size() == 0 || (file.ReadAt(0, magic) && ByteReader(magic).Match(kMagic)));
@@ -90,7 +96,8 @@ bool OpenForSaving(const std::string& path, platform::StoreFile& file) {
 }  // namespace
 
 uint32_t ThumbnailIndex::HashOf(std::string_view path) {
-  const std::string_view name = path.substr(0, path.size() - platform::SplitPath(path).extension.size());
+  const std::string_view name =
+      path.substr(0, path.size() - platform::SplitPath(path).extension.size());
   uint64_t hash = 0xcbf29ce484222325;  // FNV-1a
   for (const char c : name) hash = (hash ^ static_cast<unsigned char>(c)) * 0x100000001b3;
   return std::max<uint32_t>(1, static_cast<uint32_t>(hash ^ hash >> 32));
@@ -114,8 +121,8 @@ void ThumbnailIndex::Change(size_t record, uint32_t hash) {
     hashes_[record] = 0;
     return;
   }
-  // A record in the middle gets another name, as good as never: only all over again, each hash has its records in
-  // order.
+  // A record in the middle gets another name, as good as never: only all over again, each hash has
+  // its records in order.
   hashes_[record] = hash;
   MakeTable(hashes_.size());
 }
@@ -152,15 +159,19 @@ void ThumbnailIndex::MakeTable(size_t records) {
   }
 }
 
-std::optional<bool> ThumbnailIndex::FindInFile(const std::string& path, const State& state, uint32_t hash,
+std::optional<bool> ThumbnailIndex::FindInFile(const std::string& path, const State& state,
+                                               uint32_t hash,
                                                const std::function<bool(size_t record)>& take) {
   platform::StoreFile file;
   HeadBytes headBytes;
   Head head;
-  if (state.count < 0 || file.Open(path, platform::StoreFile::Mode::Read) != platform::StoreFile::OpenResult::Done) return {};
+  if (state.count < 0 ||
+      file.Open(path, platform::StoreFile::Mode::Read) != platform::StoreFile::OpenResult::Done)
+    return {};
   if (!file.ReadAt(0, headBytes) || !ReadHead(headBytes, state, head)) return {};
   std::array<uint8_t, kBlockSize> block;
-  for (uint64_t i = 0, number = HomeBlock(hash, head.blocks); i < head.blocks; ++i, number = (number + 1) % head.blocks) {
+  for (uint64_t i = 0, number = HomeBlock(hash, head.blocks); i < head.blocks;
+       ++i, number = (number + 1) % head.blocks) {
     if (!file.ReadAt(kHeadSize + number * kBlockSize, block)) return {};
     if (WordAt(block.data()) != BlockChecksum(block.data(), number, head)) return {};
     for (size_t place = 0; place < kCellsInBlock; ++place) {
@@ -211,7 +222,8 @@ void ThumbnailIndex::Save(const std::string& path, const State& state) const {
     if (hashes_[i] == 0) continue;
     uint64_t number = HomeBlock(hashes_[i], count);
     while (used[number] == kCellsInBlock) number = (number + 1) % count;
-    PutWord(&blocks[number * kBlockSize + kCellSize * ++used[number]], hashes_[i] | uint64_t{i + 1} << 32);
+    PutWord(&blocks[number * kBlockSize + kCellSize * ++used[number]],
+            hashes_[i] | uint64_t{i + 1} << 32);
   }
   for (uint64_t number = 0; number < count; ++number) {
     uint8_t* const block = &blocks[number * kBlockSize];

@@ -16,13 +16,16 @@ bool ReadFromSystem(const std::string& picturePath, Color matte, AnyThumbnailRec
   return true;
 }
 
-bool ReadListed(const std::string& picturePath, const ThumbnailSources& sources, ThumbnailRecord& record) {
-  const ThumbnailRecord* const listed = sources.listed ? sources.listed(platform::FileNameOf(picturePath)) : nullptr;
+bool ReadListed(const std::string& picturePath, const ThumbnailSources& sources,
+                ThumbnailRecord& record) {
+  const ThumbnailRecord* const listed =
+      sources.listed ? sources.listed(platform::FileNameOf(picturePath)) : nullptr;
   if (listed != nullptr) record = *listed;
   return listed != nullptr;
 }
 
-bool ReadSmall(const std::string& picturePath, const ThumbnailSources& sources, ThumbnailRecord& record) {
+bool ReadSmall(const std::string& picturePath, const ThumbnailSources& sources,
+               ThumbnailRecord& record) {
   const bool usesFile = sources.mode == choice::kDiskBased || sources.options.fromFiles;
   if (usesFile && ReadThumbnailFile(record, ThumbnailPathFor(picturePath))) return true;
   switch (sources.mode) {
@@ -31,14 +34,16 @@ bool ReadSmall(const std::string& picturePath, const ThumbnailSources& sources, 
     case choice::kGlobalDatabase:
     case choice::kLocalDatabase: break;
   }
-  return sources.database != nullptr && sources.database->Find(picturePath, VolumeKeyFor(picturePath), record);
+  return sources.database != nullptr &&
+         sources.database->Find(picturePath, VolumeKeyFor(picturePath), record);
 }
 
 }  // namespace
 
-bool LookUpThumbnail(const std::string& picturePath, bool large, const ThumbnailSources& sources, AnyThumbnailRecord& record) {
-  const bool fromSystem =
-      large && sources.mode == choice::kDiskBased && sources.systemCache && sources.options.fromSystem;
+bool LookUpThumbnail(const std::string& picturePath, bool large, const ThumbnailSources& sources,
+                     AnyThumbnailRecord& record) {
+  const bool fromSystem = large && sources.mode == choice::kDiskBased && sources.systemCache &&
+                          sources.options.fromSystem;
   if (fromSystem && ReadFromSystem(picturePath, sources.options.matte, record)) return true;
   ThumbnailRecord small;
   if (!ReadSmall(picturePath, sources, small)) return false;

@@ -17,13 +17,15 @@ struct ThumbnailSources {
   bool systemCache = true;  // the browser lets large records come from the system
   // Virtual mode: the record that the browser's list holds for a file name; null when it has none.
   std::function<const ThumbnailRecord*(std::string_view name)> listed;
-  ThumbnailDatabase* database = nullptr;  // of the two database modes, open; null when it could not be opened
+  // of the two database modes, open; null when it could not be opened
+  ThumbnailDatabase* database = nullptr;
   ThumbnailOptions options = {};
 };
 
-// Fills a record with the thumbnail of a picture as the mode says: thumbnail file, list, database or, for a large view
-// in the disk-based mode, the system's cache. Large records come from that cache only. False if there is no
-// thumbnail.
-bool LookUpThumbnail(const std::string& picturePath, bool large, const ThumbnailSources& sources, AnyThumbnailRecord& record);
+// Fills a record with the thumbnail of a picture as the mode says: thumbnail file, list, database
+// or, for a large view in the disk-based mode, the system's cache. Large records come from that
+// cache only. False if there is no thumbnail.
+bool LookUpThumbnail(const std::string& picturePath, bool large, const ThumbnailSources& sources,
+                     AnyThumbnailRecord& record);
 
 }  // namespace fotomill

@@ -13,23 +13,28 @@ struct Point {
   float x, y;  // pixels from the left and the top
 };
 
-// One flat color inside an outline. An outline of two points is a circle: its middle, and a point on it.
+// One flat color inside an outline. An outline of two points is a circle: its middle, and a point
+// on it.
 struct Shape {
   uint32_t color;  // 0x00RRGGBB
   std::span<const Point> outline;
 };
 
 // A photograph: frame, sky, sun, two hills.
-constexpr Point kFrameEdge[] = {{11, 19}, {85, 19}, {85, 77}, {11, 77}}, kFrame[] = {{12, 20}, {84, 20}, {84, 76}, {12, 76}},
+constexpr Point kFrameEdge[] = {{11, 19}, {85, 19}, {85, 77}, {11, 77}},
+                kFrame[] = {{12, 20}, {84, 20}, {84, 76}, {12, 76}},
                 kSky[] = {{17, 25}, {79, 25}, {79, 71}, {17, 71}}, kSun[] = {{63, 37}, {69, 37}},
-                kFarHill[] = {{17, 71}, {17, 60}, {36, 40}, {64, 71}}, kNearHill[] = {{32, 71}, {56, 49}, {79, 69}, {79, 71}};
+                kFarHill[] = {{17, 71}, {17, 60}, {36, 40}, {64, 71}},
+                kNearHill[] = {{32, 71}, {56, 49}, {79, 69}, {79, 71}};
 constexpr Shape kPhotograph[] = {{0x969696, kFrameEdge}, {0xFAFAFA, kFrame},   {0xBCD7EA, kSky},
                                  {0xF6D873, kSun},       {0x86AB86, kFarHill}, {0x5D8761, kNearHill}};
 
 // A sheet of paper with a corner turned down, crossed out.
 constexpr Point kSheetEdge[] = {{21, 9}, {61.5F, 9}, {76, 23.5F}, {76, 87}, {21, 87}},
-                kSheet[] = {{22, 10}, {61, 10}, {75, 24}, {75, 86}, {22, 86}}, kCorner[] = {{61, 10}, {75, 24}, {61, 24}},
-                kStroke[] = {{36, 44}, {40, 40}, {62, 62}, {58, 66}}, kCounterStroke[] = {{58, 40}, {62, 44}, {40, 66}, {36, 62}};
+                kSheet[] = {{22, 10}, {61, 10}, {75, 24}, {75, 86}, {22, 86}},
+                kCorner[] = {{61, 10}, {75, 24}, {61, 24}},
+                kStroke[] = {{36, 44}, {40, 40}, {62, 62}, {58, 66}},
+                kCounterStroke[] = {{58, 40}, {62, 44}, {40, 66}, {36, 62}};
 constexpr Shape kCrossedSheet[] = {
     {0x969696, kSheetEdge}, {0xFAFAFA, kSheet}, {0xC8C8C8, kCorner}, {0xC0504D, kStroke}, {0xC0504D, kCounterStroke}};
 
@@ -41,7 +46,8 @@ bool IsInside(std::span<const Point> outline, Point point) {
   bool inside = false;
   for (size_t i = 0, last = outline.size() - 1; i < outline.size(); last = i++) {
     const Point &a = outline[i], &b = outline[last];
-    const bool crosses = (a.y > point.y) != (b.y > point.y) && point.x < (b.x - a.x) * (point.y - a.y) / (b.y - a.y) + a.x;
+    const bool crosses = (a.y > point.y) != (b.y > point.y) &&
+                         point.x < (b.x - a.x) * (point.y - a.y) / (b.y - a.y) + a.x;
     inside = inside != crosses;
   }
   return inside;
@@ -78,7 +84,8 @@ bool MakePlaceholderRecord(ThumbnailRecord& record, int32_t which, Color matte) 
   record = ThumbnailRecord();
   record.Sign();
   record.Fill(matte);
-  const std::span<const Shape> shapes = which == kPlaceholderNotMade ? std::span<const Shape>(kPhotograph) : kCrossedSheet;
+  const std::span<const Shape> shapes =
+      which == kPlaceholderNotMade ? std::span<const Shape>(kPhotograph) : kCrossedSheet;
   for (const Shape& shape : shapes) Paint(record, shape);
   return true;
 }

@@ -26,13 +26,15 @@ struct ScaledPicture {
 // Both edges by the one percentage at which the longer one fits.
 Status ScaleQuickly(const PictureRecord& picture, ScaledPicture& scaled) {
   const int32_t width = picture.image.Width(), height = picture.image.Height();
-  const int32_t percentage = std::min(100 * kSmallThumbnailSide / width, 100 * kSmallThumbnailSide / height);
+  const int32_t percentage =
+      std::min(100 * kSmallThumbnailSide / width, 100 * kSmallThumbnailSide / height);
   const Size size = SizeAtPercentage(width, height, percentage);
   RETURN_IF_BAD(ScaleNearest(picture.image, size, scaled.image));
   return picture.alpha.Empty() ? Status::Ok : ScaleNearest(picture.alpha, size, scaled.alpha);
 }
 
-// How far a picture reaches in its image, by one edge of each. An image that is no reduction of it is all of it.
+// How far a picture reaches in its image, by one edge of each. An image that is no reduction of it
+// is all of it.
 double ReachOf(int32_t pictureEdge, int32_t imageEdge, int32_t reduction) {
   const double reach = static_cast<double>(pictureEdge) / reduction;
   return reduction > 1 && reach > imageEdge - 1 && reach < imageEdge ? reach : imageEdge;
@@ -41,16 +43,18 @@ double ReachOf(int32_t pictureEdge, int32_t imageEdge, int32_t reduction) {
 Status ScaleToFit(const PictureRecord& picture, ScaledPicture& scaled) {
   const int32_t width = picture.image.Width(), height = picture.image.Height();
   const bool reduced = picture.width > width || picture.height > height;
-  const Size size =
-      reduced ? FitSize(picture.width, picture.height, kSmallThumbnailSide) : FitSize(width, height, kSmallThumbnailSide);
-  const Reach reach{ReachOf(picture.width, width, picture.reduction), ReachOf(picture.height, height, picture.reduction)};
-  return ScaleFiltered(picture.image, picture.alpha, reach, size, ScaleFilter::Lanczos, scaled.image, scaled.alpha);
+  const Size size = reduced ? FitSize(picture.width, picture.height, kSmallThumbnailSide)
+                            : FitSize(width, height, kSmallThumbnailSide);
+  const Reach reach{ReachOf(picture.width, width, picture.reduction),
+                    ReachOf(picture.height, height, picture.reduction)};
+  return ScaleFiltered(picture.image, picture.alpha, reach, size, ScaleFilter::Lanczos,
+                       scaled.image, scaled.alpha);
 }
 
 template <typename Record>
 Status PlaceInSquare(const ScaledPicture& scaled, Color background, Mix mix, Record& record) {
-  const uint8_t matte[] = {static_cast<uint8_t>(background >> 16), static_cast<uint8_t>(background >> 8),
-                           static_cast<uint8_t>(background)};
+  const uint8_t matte[] = {static_cast<uint8_t>(background >> 16),
+                           static_cast<uint8_t>(background >> 8), static_cast<uint8_t>(background)};
   Record made;
   made.Sign();
   made.Fill(background);
@@ -80,7 +84,8 @@ Status PlaceInSquare(const ScaledPicture& scaled, Color background, Mix mix, Rec
 template <typename Record>
 Status ToBitmap(const Record& record, PackedImage& bitmap) {
   RETURN_IF_BAD(NewPackedImage(Record::kSide, Record::kSide, nullptr, 24, bitmap));
-  for (int32_t r = 0; r < Record::kSide; ++r) std::ranges::copy(record.StoredRow(r), bitmap.StoredRow(r).begin());
+  for (int32_t r = 0; r < Record::kSide; ++r)
+    std::ranges::copy(record.StoredRow(r), bitmap.StoredRow(r).begin());
   return Status::Ok;
 }
 
@@ -112,29 +117,38 @@ void ExpandOldRecord(ThumbnailRecord& record) {
   }
 }
 
-bool MakeThumbnailRecord(ThumbnailRecord& record, const PictureRecord& picture, const ThumbnailOptions& options) {
+bool MakeThumbnailRecord(ThumbnailRecord& record, const PictureRecord& picture,
+                         const ThumbnailOptions& options) {
   ScaledPicture scaled;
   if (picture.image.Empty()) return false;
   const Status status = options.quick ? ScaleQuickly(picture, scaled) : ScaleToFit(picture, scaled);
   return status == Status::Ok && PlaceInSquare(scaled, options.matte, Blend, record) == Status::Ok;
 }
 
-bool MakeBlendedThumbnailRecord(ThumbnailRecord& record, const PictureRecord& picture, Color background) {
+bool MakeBlendedThumbnailRecord(ThumbnailRecord& record, const PictureRecord& picture,
+                                Color background) {
   ScaledPicture scaled;
   return !picture.image.Empty() && ScaleQuickly(picture, scaled) == Status::Ok &&
          PlaceInSquare(scaled, background, MixEachRoundedDown, record) == Status::Ok;
 }
 
-bool MakeLargeThumbnailRecord(LargeThumbnailRecord& record, const PictureRecord& picture, Color matte) {
+bool MakeLargeThumbnailRecord(LargeThumbnailRecord& record, const PictureRecord& picture,
+                              Color matte) {
   if (picture.image.Empty()) return false;
   Size size{picture.image.Width(), picture.image.Height()};
-  if (std::max(size.width, size.height) > kLargeThumbnailSide) size = FitSize(size.width, size.height, kLargeThumbnailSide);
+  if (std::max(size.width, size.height) > kLargeThumbnailSide)
+    size = FitSize(size.width, size.height, kLargeThumbnailSide);
   ScaledPicture scaled;
-  return ScaleFiltered(picture.image, picture.alpha, size, ScaleFilter::Lanczos, scaled.image, scaled.alpha) == Status::Ok &&
+  return ScaleFiltered(picture.image, picture.alpha, size, ScaleFilter::Lanczos, scaled.image,
+                       scaled.alpha) == Status::Ok &&
          PlaceInSquare(scaled, matte, Blend, record) == Status::Ok;
 }
 
-Status ThumbnailRecordToBitmap(const ThumbnailRecord& record, PackedImage& bitmap) { return ToBitmap(record, bitmap); }
-Status ThumbnailRecordToBitmap(const LargeThumbnailRecord& record, PackedImage& bitmap) { return ToBitmap(record, bitmap); }
+Status ThumbnailRecordToBitmap(const ThumbnailRecord& record, PackedImage& bitmap) {
+  return ToBitmap(record, bitmap);
+}
+Status ThumbnailRecordToBitmap(const LargeThumbnailRecord& record, PackedImage& bitmap) {
+  return ToBitmap(record, bitmap);
+}
 
 }  // namespace fotomill

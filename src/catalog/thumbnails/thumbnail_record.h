@@ -14,16 +14,19 @@ namespace fotomill {
 
 struct PictureRecord;
 
-// A picture's thumbnail in a square, as thumbnail files and the thumbnail database hold it. Little-endian:
+// A picture's thumbnail in a square, as thumbnail files and the thumbnail database hold it.
+// Little-endian:
 //
 //   offset size            field
 //        0    4            magic: "THNL" of a small record, "tHNL" of a large one
 //        4    2            version, signed: 512
 //        6  258            0
-//      264    3 x side^2   pixels: blue, green, red, bottom row first, rows without padding; side 96, or 176
+//      264    3 x side^2   pixels: blue, green, red, bottom row first, rows without padding; side
+//      96, or 176
 //
-// The picture is in the middle, offsets rounded down; the rest has the background's color. Small records of versions
-// below 2 hold 96 x 96 indices into ThumbnailPalette() instead, in the same order of rows.
+// The picture is in the middle, offsets rounded down; the rest has the background's color. Small
+// records of versions below 2 hold 96 x 96 indices into ThumbnailPalette() instead, in the same
+// order of rows.
 inline constexpr size_t kThumbnailHeaderSize = 264;
 inline constexpr int16_t kThumbnailVersion = 512;  // of records written now
 inline constexpr int32_t kSmallThumbnailSide = 96;  // pixels
@@ -49,7 +52,8 @@ struct SquareThumbnailRecord {
   }
   // Sets the magic of this size and the version.
   void Sign() {
-    const std::string_view magic = side == kLargeThumbnailSide ? kLargeThumbnailMagic : kSmallThumbnailMagic;
+    const std::string_view magic =
+        side == kLargeThumbnailSide ? kLargeThumbnailMagic : kSmallThumbnailMagic;
     for (size_t i = 0; i < magic.size(); ++i) bytes[i] = static_cast<uint8_t>(magic[i]);
     bytes[4] = kThumbnailVersion & 0xff;
     bytes[5] = kThumbnailVersion >> 8;
@@ -62,11 +66,13 @@ struct SquareThumbnailRecord {
   }
   // Row r in stored order, from the bottom.
   std::span<uint8_t> StoredRow(int32_t r) {
-    return std::span(bytes).subspan(kThumbnailHeaderSize + static_cast<size_t>(r) * kStride, kStride);
+    return std::span(bytes).subspan(kThumbnailHeaderSize + static_cast<size_t>(r) * kStride,
+                                    kStride);
   }
   // Row r from the bottom: blue, green, red.
   std::span<const uint8_t> StoredRow(int32_t r) const {
-    return std::span(bytes).subspan(kThumbnailHeaderSize + static_cast<size_t>(r) * kStride, kStride);
+    return std::span(bytes).subspan(kThumbnailHeaderSize + static_cast<size_t>(r) * kStride,
+                                    kStride);
   }
 };
 // The small record, of files and the database, and the large one, of the large view.
@@ -80,15 +86,20 @@ const Palette& ThumbnailPalette();
 // Makes the pixels of an old record, whose indices stand where pixels begin.
 void ExpandOldRecord(ThumbnailRecord& record);
 
-// Makes a record from a picture that was read: scaled to fit by the filtered scaler, or by the quick one with
-// `quick`, alpha flattened onto the matte. An image that is smaller than the picture's `width` and
-// `height` (a reduced decode) will do for the filtered scaler. False without pixels or memory; `record` is then as before.
-bool MakeThumbnailRecord(ThumbnailRecord& record, const PictureRecord& picture, const ThumbnailOptions& options);
-// The same by the quick scaler only, alpha blended with `background`, each product rounded down by itself.
-bool MakeBlendedThumbnailRecord(ThumbnailRecord& record, const PictureRecord& picture, Color background);
-// A large record: a picture that does not fit is scaled down by the filtered scaler, a smaller one stays as large as it is;
-// alpha is flattened onto the matte.
-bool MakeLargeThumbnailRecord(LargeThumbnailRecord& record, const PictureRecord& picture, Color matte);
+// Makes a record from a picture that was read: scaled to fit by the filtered scaler, or by the
+// quick one with `quick`, alpha flattened onto the matte. An image that is smaller than the
+// picture's `width` and `height` (a reduced decode) will do for the filtered scaler. False without
+// pixels or memory; `record` is then as before.
+bool MakeThumbnailRecord(ThumbnailRecord& record, const PictureRecord& picture,
+                         const ThumbnailOptions& options);
+// The same by the quick scaler only, alpha blended with `background`, each product rounded down by
+// itself.
+bool MakeBlendedThumbnailRecord(ThumbnailRecord& record, const PictureRecord& picture,
+                                Color background);
+// A large record: a picture that does not fit is scaled down by the filtered scaler, a smaller one
+// stays as large as it is; alpha is flattened onto the matte.
+bool MakeLargeThumbnailRecord(LargeThumbnailRecord& record, const PictureRecord& picture,
+                              Color matte);
 
 // A new 24-bit bitmap with the record's pixels. Statuses as NewPackedImage.
 Status ThumbnailRecordToBitmap(const ThumbnailRecord& record, PackedImage& bitmap);

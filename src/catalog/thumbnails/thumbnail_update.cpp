@@ -15,23 +15,28 @@ namespace fotomill {
 const ThumbnailUpdateChoice kThumbnailUpdateChoices[4] = {
     {kUpdateCreate, TrLater("&Create thumbnails now. This may take a few seconds.")},
     {kUpdateLater, TrLater("&Don't create thumbnails now, but display this prompt in the future.")},
-    {kUpdateNotHere, TrLater("D&on't create thumbnails now and don't display this prompt again for this browser.")},
-    {kUpdateNever,
-     TrLater("Do&n't create thumbnails now and never display this prompt again. This option can be reversed in Setup.")},
+    {kUpdateNotHere,
+     TrLater("D&on't create thumbnails now and don't display this prompt again for this browser.")},
+    {kUpdateNever, TrLater("Do&n't create thumbnails now and never display this prompt again. This "
+                           "option can be reversed in Setup.")},
 };
 
 namespace {
 
 using platform::DriveKind;
 
-constexpr DriveKind kOfferedOn[] = {DriveKind::Fixed, DriveKind::Network, DriveKind::Optical, DriveKind::Ram};
-constexpr DriveKind kCompactedOn[] = {DriveKind::Removable, DriveKind::Fixed, DriveKind::Network, DriveKind::Ram};
+constexpr DriveKind kOfferedOn[] = {DriveKind::Fixed, DriveKind::Network, DriveKind::Optical,
+                                    DriveKind::Ram};
+constexpr DriveKind kCompactedOn[] = {DriveKind::Removable, DriveKind::Fixed, DriveKind::Network,
+                                      DriveKind::Ram};
 
 bool IsOn(const std::string& folder, std::span<const DriveKind> kinds) {
   return std::ranges::find(kinds, platform::VolumeOf(folder).kind) != kinds.end();
 }
 
-bool HasThumbnailFile(const std::string& path) { return platform::FileExists(ThumbnailPathFor(path)); }
+bool HasThumbnailFile(const std::string& path) {
+  return platform::FileExists(ThumbnailPathFor(path));
+}
 
 // Records of the pictures that have no thumbnail file. False when it was given up.
 bool MakeRecordsInMemory(const ThumbnailBrowser& browser, ThumbnailUpdateFace& face) {
@@ -41,17 +46,20 @@ bool MakeRecordsInMemory(const ThumbnailBrowser& browser, ThumbnailUpdateFace& f
     if (file.starts_with('.') || HasThumbnailFile(path)) continue;
     if (!face.ShowProgress(Tr("Creating thumbnails"), i, browser.files.size())) return false;
     ThumbnailRecord record;
-    if (MakeThumbnailOfFile(path, browser.options.making, record) == Status::Ok) face.AttachRecord(file, record);
+    if (MakeThumbnailOfFile(path, browser.options.making, record) == Status::Ok)
+      face.AttachRecord(file, record);
   }
   return true;
 }
 
 // The files of the list without a thumbnail file. False when it was given up.
-bool FindMissing(const ThumbnailBrowser& browser, ThumbnailUpdateFace& face, std::vector<std::string>& missing) {
+bool FindMissing(const ThumbnailBrowser& browser, ThumbnailUpdateFace& face,
+                 std::vector<std::string>& missing) {
   const std::string text = Tr("Scanning %1", browser.folder);
   for (size_t i = 0; i < browser.files.size(); ++i) {
     if (!face.ShowProgress(text, i, browser.files.size())) return false;
-    if (!HasThumbnailFile(platform::JoinFolder(browser.folder, browser.files[i]))) missing.push_back(browser.files[i]);
+    if (!HasThumbnailFile(platform::JoinFolder(browser.folder, browser.files[i])))
+      missing.push_back(browser.files[i]);
   }
   return true;
 }
@@ -65,14 +73,16 @@ void Keep(int32_t choice, ThumbnailBrowser& browser, ThumbnailUpdateFace& face) 
   face.KeepChoice(browser.options);
 }
 
-void ApplyChoice(int32_t choice, const std::vector<std::string>& missing, ThumbnailBrowser& browser, ThumbnailUpdateFace& face) {
+void ApplyChoice(int32_t choice, const std::vector<std::string>& missing, ThumbnailBrowser& browser,
+                 ThumbnailUpdateFace& face) {
   switch (choice) {
     case kUpdateCreate:
       Keep(choice, browser, face);
       if (face.BuildThumbnails(missing) > 0) face.Refresh();
       break;
     case kUpdateLater: Keep(choice, browser, face); break;
-    case kUpdateNotHere: browser.asks = false; break;  // what is stored stays, as this was said of one browser only
+    // what is stored stays, as this was said of one browser only
+    case kUpdateNotHere: browser.asks = false; break;
     case kUpdateNever:
       browser.options.offers = false;
       Keep(choice, browser, face);
@@ -84,8 +94,10 @@ void ApplyChoice(int32_t choice, const std::vector<std::string>& missing, Thumbn
 }  // namespace
 
 std::string ThumbnailUpdateQuestion(int32_t count) {
-  return Tr("%1 file(s) in this folder do not have display thumbnails associated with them. Fotomill can create these for you now.",
-            count);
+  return Tr(
+      "%1 file(s) in this folder do not have display thumbnails associated with them. Fotomill can "
+      "create these for you now.",
+      count);
 }
 
 bool OfferThumbnailUpdate(ThumbnailBrowser& browser, ThumbnailUpdateFace& face) {
@@ -94,11 +106,15 @@ bool OfferThumbnailUpdate(ThumbnailBrowser& browser, ThumbnailUpdateFace& face) 
   if (browser.mode == choice::kVirtual && !MakeRecordsInMemory(browser, face)) return false;
   if (IsCompactionDue(browser)) (void)RemoveOrphanThumbnails(browser);
 
-  const bool showsThumbnails = browser.view >= choice::kViewSmall && browser.view <= choice::kViewLarge;
-  if (!browser.options.offers || !showsThumbnails || !browser.asks || browser.files.empty()) return false;
+  const bool showsThumbnails =
+      browser.view >= choice::kViewSmall && browser.view <= choice::kViewLarge;
+  if (!browser.options.offers || !showsThumbnails || !browser.asks || browser.files.empty())
+    return false;
   std::vector<std::string> missing;
   if (!FindMissing(browser, face, missing) || missing.empty()) return false;
-  ApplyChoice(face.AskForUpdate(static_cast<int32_t>(missing.size()), SelectedChoice(browser.options.choice)), missing, browser, face);
+  ApplyChoice(face.AskForUpdate(static_cast<int32_t>(missing.size()),
+                                SelectedChoice(browser.options.choice)),
+              missing, browser, face);
   return true;
 }
 

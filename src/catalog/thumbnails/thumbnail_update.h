@@ -12,8 +12,9 @@ namespace fotomill {
 template <int32_t side> struct SquareThumbnailRecord;
 using ThumbnailRecord = SquareThumbnailRecord<96>;
 
-// What a browser does about thumbnails once it has listed a folder: makes the records that live in memory only, removes
-// thumbnail files that have lost their picture, and offers to make those that are missing.
+// What a browser does about thumbnails once it has listed a folder: makes the records that live in
+// memory only, removes thumbnail files that have lost their picture, and offers to make those that
+// are missing.
 
 // How the user wants that: the keys named.
 struct ThumbnailUpdateOptions {
@@ -27,7 +28,8 @@ struct ThumbnailUpdateOptions {
 // What the work needs to know of a browser, and what it keeps in it.
 struct ThumbnailBrowser {
   std::string folder;
-  std::vector<std::string> files;  // names in its list, all files of the folder that it shows, without folders and drives
+  // names in its list, all files of the folder that it shows, without folders and drives
+  std::vector<std::string> files;
   choice::ThumbnailMode mode = choice::kDiskBased;
   choice::ViewMode view = choice::kViewNormal;
   bool asks = true;            // false once its user wants no more offers here
@@ -36,9 +38,10 @@ struct ThumbnailBrowser {
   ThumbnailUpdateOptions options = {};
 };
 
-// Values of UpdateThumbnailsOptions and the texts of the box "Update Thumbnails", which shows ThumbnailUpdateQuestion,
-// kThumbnailUpdateRequest and these choices.
-inline constexpr int32_t kUpdateCreate = 101, kUpdateLater = 102, kUpdateNotHere = 103, kUpdateNever = 104;
+// Values of UpdateThumbnailsOptions and the texts of the box "Update Thumbnails", which shows
+// ThumbnailUpdateQuestion, kThumbnailUpdateRequest and these choices.
+inline constexpr int32_t kUpdateCreate = 101, kUpdateLater = 102, kUpdateNotHere = 103,
+                         kUpdateNever = 104;
 // One of the answers that the offer lets the user choose.
 struct ThumbnailUpdateChoice {
   int32_t value;
@@ -48,7 +51,8 @@ struct ThumbnailUpdateChoice {
 extern const ThumbnailUpdateChoice kThumbnailUpdateChoices[4];
 // Of the window with the question.
 inline constexpr const char* kThumbnailUpdateTitle = "Update Thumbnails";
-inline constexpr const char* kThumbnailUpdateRequest = "Please select one of the following options.";
+inline constexpr const char* kThumbnailUpdateRequest =
+    "Please select one of the following options.";
 // `count`: files without a thumbnail that is up to date.
 std::string ThumbnailUpdateQuestion(int32_t count);
 
@@ -56,11 +60,13 @@ std::string ThumbnailUpdateQuestion(int32_t count);
 class ThumbnailUpdateFace {
  public:
   virtual ~ThumbnailUpdateFace() = default;
-  // `done` of `total` files are dealt with under a text such as "Scanning FOLDER". False gives up, as nothing had been offered.
+  // `done` of `total` files are dealt with under a text such as "Scanning FOLDER". False gives up,
+  // as nothing had been offered.
   virtual bool ShowProgress(const std::string& text, size_t done, size_t total) = 0;
   // Virtual mode: keeps a record with a file of the list, in place of an earlier one.
   virtual void AttachRecord(const std::string& file, const ThumbnailRecord& record) = 0;
-  // Shows the box for so many files with a choice selected. The choice made, or 0 when the box was closed without one.
+  // Shows the box for so many files with a choice selected. The choice made, or 0 when the box was
+  // closed without one.
   virtual int32_t AskForUpdate(int32_t count, int32_t selected) = 0;
   // Makes the thumbnail files of these files of the list; how many were made.
   virtual int32_t BuildThumbnails(const std::vector<std::string>& files) = 0;
@@ -69,15 +75,15 @@ class ThumbnailUpdateFace {
   virtual void KeepChoice(const ThumbnailUpdateOptions& options) { (void)options; }
 };
 
-// All of it. Never in the database modes, nor on removable drives. True when an offer was made; what was chosen is then in
-// the browser and its options.
+// All of it. Never in the database modes, nor on removable drives. True when an offer was made;
+// what was chosen is then in the browser and its options.
 bool OfferThumbnailUpdate(ThumbnailBrowser& browser, ThumbnailUpdateFace& face);
 
 // Whether so much time has passed since the browser's last compaction that the next one is due.
 bool IsCompactionDue(const ThumbnailBrowser& browser);
-// Deletes thumbnail files to which no file of the browser's list belongs. False, and nothing happens, unless
-// the options compact, on optical drives and drives of a kind unknown, or when the folder cannot be read. The time of a
-// successful run is kept in the browser.
+// Deletes thumbnail files to which no file of the browser's list belongs. False, and nothing
+// happens, unless the options compact, on optical drives and drives of a kind unknown, or when the
+// folder cannot be read. The time of a successful run is kept in the browser.
 bool RemoveOrphanThumbnails(ThumbnailBrowser& browser);
 
 }  // namespace fotomill

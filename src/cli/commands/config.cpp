@@ -56,9 +56,10 @@ std::string UnknownKey(const std::string& name) {
 }
 
 void PrintProblem(const CommandContext& context, std::string_view message) {
-  const std::string path = context.io.errTerminal ? EscapeControls(ConfigurationPath()) : ConfigurationPath();
-  std::fprintf(context.io.err, "%s: %.*s\n", path.empty() ? "fotomill" : path.c_str(), static_cast<int>(message.size()),
-               message.data());
+  const std::string path =
+      context.io.errTerminal ? EscapeControls(ConfigurationPath()) : ConfigurationPath();
+  std::fprintf(context.io.err, "%s: %.*s\n", path.empty() ? "fotomill" : path.c_str(),
+               static_cast<int>(message.size()), message.data());
 }
 
 // The rows of all named keys; false, after a message, if one is unknown.
@@ -107,7 +108,8 @@ int RunGet(const ConfigOptions& options, const CommandContext& context) {
 }
 
 // Makes or, in a dry run, only shows one change: "KEY: OLD -> NEW".
-int Change(const ConfigOptions& options, const CommandContext& context, const KeyRow& row, const SettingValue* value) {
+int Change(const ConfigOptions& options, const CommandContext& context, const KeyRow& row,
+           const SettingValue* value) {
   const std::string before = ValueText(row);
   SaveResult result = SaveResult::Done;
   if (!options.dryRun) {
@@ -167,7 +169,8 @@ int RunPath(const ConfigOptions& options, const CommandContext& context) {
 
 using Run = int (*)(const ConfigOptions& options, const CommandContext& context);
 
-std::shared_ptr<ConfigOptions> SetUp(CLI::App& app, CommandContext& context, Run run, const char* jsonHelp, const char* example) {
+std::shared_ptr<ConfigOptions> SetUp(CLI::App& app, CommandContext& context, Run run,
+                                     const char* jsonHelp, const char* example) {
   auto options = std::make_shared<ConfigOptions>();
   AddFlag(app, "--json", options->json, jsonHelp);
   SetFooter(app, nullptr, example);
@@ -191,18 +194,21 @@ void SetUpConfigGet(CLI::App& app, CommandContext& context) {
 
 void SetUpConfigSet(CLI::App& app, CommandContext& context) {
   context.names.Declare("KEY VALUE", "Key name and its new value", 2, 2);
-  const auto options = SetUp(app, context, RunSet, kKeyJson, "fotomill config set JpegCompression 85");
+  const auto options =
+      SetUp(app, context, RunSet, kKeyJson, "fotomill config set JpegCompression 85");
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would change");
 }
 
 void SetUpConfigUnset(CLI::App& app, CommandContext& context) {
   context.names.Declare("KEY", "Name of the key to reset", 1, 1);
-  const auto options = SetUp(app, context, RunUnset, kKeyJson, "fotomill config unset JpegCompression");
+  const auto options =
+      SetUp(app, context, RunUnset, kKeyJson, "fotomill config unset JpegCompression");
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would change");
 }
 
 void SetUpConfigPath(CLI::App& app, CommandContext& context) {
-  SetUp(app, context, RunPath, TrLater("Print a JSON array of {path, exists}"), "fotomill config path");
+  SetUp(app, context, RunPath, TrLater("Print a JSON array of {path, exists}"),
+        "fotomill config path");
 }
 
 }  // namespace fotomill::cli

@@ -39,8 +39,9 @@ struct SheetOptions {
 };
 
 constexpr int32_t kColumns = 5, kRows = 4, kMostCells = 1000;
-constexpr const char* kNoFont =
-    TrLater("No font for the names was found; use --no-names, or install a font (package fonts-dejavu-core).");
+constexpr const char* kNoFont = TrLater(
+    "No font for the names was found; use --no-names, or install a font (package "
+    "fonts-dejavu-core).");
 constexpr Color kPaper = 0xFFFFFF;
 
 // A color written as RRGGBB.
@@ -48,7 +49,8 @@ std::optional<Color> ColorOf(std::string_view text) {
   uint32_t value = 0;
   if (text.starts_with('#')) text.remove_prefix(1);
   const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), value, 16);
-  if (text.size() != 6 || error != std::errc() || end != text.data() + text.size()) return std::nullopt;
+  if (text.size() != 6 || error != std::errc() || end != text.data() + text.size())
+    return std::nullopt;
   return (value & 0xFF) << 16 | (value & 0xFF00) | value >> 16;
 }
 
@@ -64,7 +66,9 @@ std::string ReadLook(const SheetOptions& options, CatalogueLook& look) {
   look.cellWidth = look.cellHeight = options.cell;
   look.pageWidth = options.pageWidth;
   look.pageHeight = options.pageHeight;
-  look.frame = options.frame == "none" ? CellFrame::None : options.frame == "flat" ? CellFrame::Flat : CellFrame::Raised;
+  look.frame = options.frame == "none"   ? CellFrame::None
+               : options.frame == "flat" ? CellFrame::Flat
+                                         : CellFrame::Raised;
   look.blackText = options.blackText;
   look.names = !options.noNames;
   if (options.blackText) look.background = kPaper;
@@ -88,9 +92,12 @@ int RunSheet(const SheetOptions& options, const CommandContext& context) {
   ContactSheetOptions sheet;
   sheet.fontName = settings.CatalogFontName.view();
   sheet.upright = settings.ExifAdjustOrientation != 0;
-  if (const std::string wrong = ReadDestinationFormat(options.to, job); !wrong.empty()) return UsageError(context, wrong);
-  if (const std::string wrong = ReadLook(options, sheet.look); !wrong.empty()) return UsageError(context, wrong);
-  if (platform::ExistenceOf(options.dest) == platform::Existence::Yes && !platform::IsFolder(options.dest)) {
+  if (const std::string wrong = ReadDestinationFormat(options.to, job); !wrong.empty())
+    return UsageError(context, wrong);
+  if (const std::string wrong = ReadLook(options, sheet.look); !wrong.empty())
+    return UsageError(context, wrong);
+  if (platform::ExistenceOf(options.dest) == platform::Existence::Yes &&
+      !platform::IsFolder(options.dest)) {
     return UsageError(context, Tr("\"%1\" is not a folder.", options.dest));
   }
   const auto files = SelectFiles(options.selection, context);
@@ -107,7 +114,8 @@ int RunSheet(const SheetOptions& options, const CommandContext& context) {
   sheet.reduceHint = Tr("Use --reduce to reduce them.");
   sheet.jobs = static_cast<uint32_t>(options.jobs);
   if (const Status status = RunContactSheet(*files, sheet, job); status != Status::Ok) {
-    const std::string hint = status == Status::ResourceError ? std::string(" ") + Tr(kNoFont) : std::string();
+    const std::string hint =
+        status == Status::ResourceError ? std::string(" ") + Tr(kNoFont) : std::string();
     output.Message(output.ShownMessage(options.dest) + ": " + Tr(StatusMessage(status)) + hint);
     return kExitFailed;
   }
@@ -120,21 +128,30 @@ void SetUpContactSheet(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<SheetOptions>();
   AddSelection(app, options->selection, context);
   Require(AddName(app, "-t,--to", options->to, "EXT", "Format of the pages, by extension"));
-  Require(AddName(app, "-d,--dest", options->dest, "DIR", "Folder of the pages, created if needed"));
-  AddNumber(app, "--columns", options->columns, "N", 1, kMostCells, "Pictures per row (default: CatalogLandscapeWide, else 5)");
-  AddNumber(app, "--rows", options->rows, "N", 1, kMostCells, "Rows per page (default: CatalogLandscapeDeep, else 4)");
-  AddNumber(app, "--cell", options->cell, "N", 8, 4096, "Longer side of each picture in pixels (default: 96)");
-  AddNumber(app, "--page-width", options->pageWidth, "N", 1, 65535, "Page width in pixels (default: fits the cells)");
-  AddNumber(app, "--page-height", options->pageHeight, "N", 1, 65535, "Page height in pixels (default: fits the cells)");
-  AddChoice(app, "--frame", options->frame, "HOW", "Frame around each cell: none, raised (default) or flat",
-            {"none", "raised", "flat"});
-  AddFlag(app, "--black-text", options->blackText, "Black names and flat frames; on white unless --background is given");
+  Require(
+      AddName(app, "-d,--dest", options->dest, "DIR", "Folder of the pages, created if needed"));
+  AddNumber(app, "--columns", options->columns, "N", 1, kMostCells,
+            "Pictures per row (default: CatalogLandscapeWide, else 5)");
+  AddNumber(app, "--rows", options->rows, "N", 1, kMostCells,
+            "Rows per page (default: CatalogLandscapeDeep, else 4)");
+  AddNumber(app, "--cell", options->cell, "N", 8, 4096,
+            "Longer side of each picture in pixels (default: 96)");
+  AddNumber(app, "--page-width", options->pageWidth, "N", 1, 65535,
+            "Page width in pixels (default: fits the cells)");
+  AddNumber(app, "--page-height", options->pageHeight, "N", 1, 65535,
+            "Page height in pixels (default: fits the cells)");
+  AddChoice(app, "--frame", options->frame, "HOW",
+            "Frame around each cell: none, raised (default) or flat", {"none", "raised", "flat"});
+  AddFlag(app, "--black-text", options->blackText,
+          "Black names and flat frames; on white unless --background is given");
   AddText(app, "--background", options->background, "RRGGBB", "Page color (default: 606060)");
   AddFlag(app, "--no-names", options->noNames, "Leave out the file names");
   AddFlag(app, "--reduce", options->reduce, "Reduce colors if the format supports fewer");
-  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, INT32_MAX, "Number of parallel jobs (default: 0, one per core)");
+  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, INT32_MAX,
+            "Number of parallel jobs (default: 0, one per core)");
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be done");
-  AddFlag(app, "--json", options->json, "Print a JSON array of {file, destination, status, message}");
+  AddFlag(app, "--json", options->json,
+          "Print a JSON array of {file, destination, status, message}");
   SetFooter(app,
             "Pages are named Catalog_00001.EXT and so on; PrefixCatalog sets the prefix. Existing files are never replaced.\n"
             "CatalogFontName sets the font of the names.",

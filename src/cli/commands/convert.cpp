@@ -50,8 +50,10 @@ struct ConvertOptions {
 
 constexpr size_t kLongestPrefix = SettingPrefix::Capacity();
 
-// The option decides if given, else the settings. If the settings say ask and nobody can answer, both files are kept.
-void SetOverwritePolicy(const ConvertOptions& options, const CommandContext& context, BatchJob& job) {
+// The option decides if given, else the settings. If the settings say ask and nobody can answer,
+// both files are kept.
+void SetOverwritePolicy(const ConvertOptions& options, const CommandContext& context,
+                        BatchJob& job) {
   const std::string& how = options.overwrite;
   if (how == "ask") job.overwrite.prompt = true;
   if (how == "replace") job.overwrite.prompt = false;
@@ -73,47 +75,60 @@ BatchFunction FunctionOf(const ConvertOptions& options, const Recipe* recipe) {
                          .keepTimes = options.keepTimes,
                          .keepTree = options.keepTree,
                          .dryRun = options.dryRun};
-  if (!options.prefix.empty() || !options.apply) function.prefix = options.prefix.empty() ? std::string() : options.prefix.back();
-  if (options.apply && recipe != nullptr && recipe->HasSteps()) function.history = FunctionOfFamily(recipe->First()->family);
+  if (!options.prefix.empty() || !options.apply)
+    function.prefix = options.prefix.empty() ? std::string() : options.prefix.back();
+  if (options.apply && recipe != nullptr && recipe->HasSteps())
+    function.history = FunctionOfFamily(recipe->First()->family);
   return function;
 }
 
-// Reads the format that is asked for into `job`; none where every file keeps its own. What is wrong, or empty.
+// Reads the format that is asked for into `job`; none where every file keeps its own. What is
+// wrong, or empty.
 std::string ReadFormat(const ConvertOptions& options, bool mayKeep, BatchJob& job) {
-  if (options.to.empty() && options.out.empty()) return mayKeep ? std::string() : Tr("Name the output format with --to.");
-  const std::string extension = options.to.empty() ? std::string(platform::ExtensionOf(options.out)) : options.to;
+  if (options.to.empty() && options.out.empty())
+    return mayKeep ? std::string() : Tr("Name the output format with --to.");
+  const std::string extension =
+      options.to.empty() ? std::string(platform::ExtensionOf(options.out)) : options.to;
   const std::string wrong = ReadDestinationFormat(extension, job);
   const bool fromName = job.formatIndex == kNoFormat && options.to.empty();
   return fromName ? Tr("\"%1\" selects no format; name one with --to.", options.out) : wrong;
 }
 
-// What is wrong with the options, as a sentence; empty when nothing is. Takes the format into `job`.
-std::string CheckOptions(const ConvertOptions& options, const CommandContext& context, const Recipe* recipe, BatchJob& job) {
-  const bool saves = recipe != nullptr && std::ranges::all_of(recipe->outputs, [](const RecipeOutput& output) {
-                       return !output.save.to.empty();
-                     });
-  if (const std::string wrong = ReadFormat(options, options.apply || saves, job); !wrong.empty()) return wrong;
-  if (recipe != nullptr && recipe->outputs.size() > 1 && !options.out.empty()) return Tr("--out takes a recipe with one output.");
+// What is wrong with the options, as a sentence; empty when nothing is. Takes the format into
+// `job`.
+std::string CheckOptions(const ConvertOptions& options, const CommandContext& context,
+                         const Recipe* recipe, BatchJob& job) {
+  const bool saves =
+      recipe != nullptr && std::ranges::all_of(recipe->outputs, [](const RecipeOutput& output) {
+        return !output.save.to.empty();
+      });
+  if (const std::string wrong = ReadFormat(options, options.apply || saves, job); !wrong.empty())
+    return wrong;
+  if (recipe != nullptr && recipe->outputs.size() > 1 && !options.out.empty())
+    return Tr("--out takes a recipe with one output.");
   const std::string prefix = options.prefix.empty() ? std::string() : options.prefix.back();
   if (prefix.size() > kLongestPrefix) {
     return Tr("The prefix is longer than %1 characters.", kLongestPrefix);
   }
   if (!IsPlainName(prefix)) return Tr("The prefix must be part of a file name, not a path.");
   if (options.keepTree && options.dest.empty()) return Tr("--keep-tree needs --dest.");
-  if (options.overwrite == "ask" && !context.MayAsk()) return Tr("--overwrite ask needs a terminal.");
-  if (!options.dest.empty() && platform::ExistenceOf(options.dest) == platform::Existence::Yes && !platform::IsFolder(options.dest)) {
+  if (options.overwrite == "ask" && !context.MayAsk())
+    return Tr("--overwrite ask needs a terminal.");
+  if (!options.dest.empty() && platform::ExistenceOf(options.dest) == platform::Existence::Yes &&
+      !platform::IsFolder(options.dest)) {
     return Tr("\"%1\" is not a folder.", options.dest);
   }
   return {};
 }
 
 // Hands the recipe to the function. What is wrong, or empty.
-std::string TakeRecipe(const ConvertOptions& options, const std::shared_ptr<const Recipe>& recipe, const BatchJob& job,
-                       BatchFunction& function) {
+std::string TakeRecipe(const ConvertOptions& options, const std::shared_ptr<const Recipe>& recipe,
+                       const BatchJob& job, BatchFunction& function) {
   if (recipe == nullptr) return {};
   BatchJob fallback;
   const std::string extension(settings.DefaultFileExtension.view());
-  if (!ReadDestinationFormat(extension, fallback).empty()) (void)ReadDestinationFormat("png", fallback);
+  if (!ReadDestinationFormat(extension, fallback).empty())
+    (void)ReadDestinationFormat("png", fallback);
   function.fallback = {fallback.formatIndex, fallback.extension};
   const FormatLookup lookup = [](const std::string& name, int32_t& index, std::string& format) {
     BatchJob found;
@@ -122,7 +137,9 @@ std::string TakeRecipe(const ConvertOptions& options, const std::shared_ptr<cons
     format = found.extension;
     return wrong;
   };
-  if (std::string wrong = SetRecipe(recipe, std::string(settings.ExifCopyrightHolder.view()), job, lookup, function); !wrong.empty()) {
+  if (std::string wrong = SetRecipe(recipe, std::string(settings.ExifCopyrightHolder.view()), job,
+                                    lookup, function);
+      !wrong.empty()) {
     return wrong;
   }
   if (options.quality > 0) {  // an option of the command line wins over the recipe
@@ -138,13 +155,17 @@ int RunConvert(const ConvertOptions& options, const CommandContext& context) {
   BatchJob job = NewBatchJob();
   job.remember = nullptr;
   std::shared_ptr<const Recipe> recipe;
-  if (!ReadRecipeOptions({options.steps, options.recipe, options.apply}, context, recipe)) return kExitUsage;
-  if (const std::string wrong = CheckOptions(options, context, recipe.get(), job); !wrong.empty()) return UsageError(context, wrong);
+  if (!ReadRecipeOptions({options.steps, options.recipe, options.apply}, context, recipe))
+    return kExitUsage;
+  if (const std::string wrong = CheckOptions(options, context, recipe.get(), job); !wrong.empty())
+    return UsageError(context, wrong);
   BatchFunction function = FunctionOf(options, recipe.get());
-  if (const std::string wrong = TakeRecipe(options, recipe, job, function); !wrong.empty()) return UsageError(context, wrong);
+  if (const std::string wrong = TakeRecipe(options, recipe, job, function); !wrong.empty())
+    return UsageError(context, wrong);
   const auto files = SelectFiles(options.selection, context);
   if (!files) return kExitUsage;
-  if (!options.out.empty() && files->size() != 1) return UsageError(context, Tr("--out takes exactly one picture."));
+  if (!options.out.empty() && files->size() != 1)
+    return UsageError(context, Tr("--out takes exactly one picture."));
   if (options.quality > 0) job.encode.jpegQuality = job.encode.webpQuality = options.quality;
 
   ResultOutput output(context, options.json);
@@ -168,27 +189,36 @@ namespace {
 void SetUp(CLI::App& app, CommandContext& context, const std::shared_ptr<ConvertOptions>& options) {
   AddSelection(app, options->selection, context);
   AddName(app, "-t,--to", options->to, "EXT", "Output format, by extension");
-  CLI::Option* dest =
-      AddName(app, "-d,--dest", options->dest, "DIR", "Output folder, created if needed (default: beside each source)");
-  CLI::Option* out = AddName(app, "-o,--out", options->out, "FILE", "Output file, for a single picture");
+  CLI::Option* dest = AddName(app, "-d,--dest", options->dest, "DIR",
+                              "Output folder, created if needed (default: beside each source)");
+  CLI::Option* out =
+      AddName(app, "-o,--out", options->out, "FILE", "Output file, for a single picture");
   Exclude(out, dest);
-  Exclude(AddRepeatedText(app, "--prefix", options->prefix, "TEXT", "Prefix for output names"), out);
-  CLI::Option* steps = AddText(app, "--do", options->steps, "TEXT", "Operations to apply, separated by \";\": 'resize 50%; sharpen 0.5'");
-  Exclude(AddName(app, "--recipe", options->recipe, "FILE|NAME", "Recipe to apply (see \"fotomill recipe list\")"), steps);
+  Exclude(AddRepeatedText(app, "--prefix", options->prefix, "TEXT", "Prefix for output names"),
+          out);
+  CLI::Option* steps =
+      AddText(app, "--do", options->steps, "TEXT",
+              "Operations to apply, separated by \";\": 'resize 50%; sharpen 0.5'");
+  Exclude(AddName(app, "--recipe", options->recipe, "FILE|NAME",
+                  "Recipe to apply (see \"fotomill recipe list\")"),
+          steps);
   AddChoice(app, "--overwrite", options->overwrite, "HOW",
             "If the output exists: ask (default on a terminal), replace, keep-both (default otherwise) or skip",
             {"ask", "replace", "keep-both", "skip"});
   AddFlag(app, "--keep-tree", options->keepTree, "Recreate the source folders in --dest");
   AddFlag(app, "--keep-times", options->keepTimes, "Keep the modification times of the sources");
-  AddChoice(app, "--metadata", options->metadata, "HOW", "Keep (default) or strip EXIF, XMP and color profiles", {"keep", "strip"});
+  AddChoice(app, "--metadata", options->metadata, "HOW",
+            "Keep (default) or strip EXIF, XMP and color profiles", {"keep", "strip"});
   AddFlag(app, "--auto-orient", options->autoOrient, "Rotate pictures upright by EXIF orientation");
   AddFlag(app, "--reduce", options->reduce, "Reduce colors if the format supports fewer");
   AddNumber(app, "--quality", options->quality, "N", 1, 100, "JPEG and WebP quality, 1 to 100");
   AddNumber(app, "--page", options->page, "N", 1, INT32_MAX, "Page to convert, from 1");
-  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, INT32_MAX, "Number of parallel jobs (default: 0, one per core)");
+  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, INT32_MAX,
+            "Number of parallel jobs (default: 0, one per core)");
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be done");
   AddFlag(app, "-v,--verbose", options->verbose, "Report metadata that the format cannot store");
-  AddFlag(app, "--json", options->json, "Print a JSON array of {file, destination, status, message}");
+  AddFlag(app, "--json", options->json,
+          "Print a JSON array of {file, destination, status, message}");
   context.run = [options, &context] { return RunConvert(*options, context); };
 }
 

@@ -28,13 +28,15 @@ namespace {
 void Report(ResultOutput& output, std::string_view label, std::string_view fact) {
   constexpr size_t kColumn = 16;
   const size_t width = CharacterCount(label);
-  output.Line(std::string(label).append(width < kColumn ? kColumn - width : 1, ' ') + EscapeControls(fact));
+  output.Line(std::string(label).append(width < kColumn ? kColumn - width : 1, ' ') +
+              EscapeControls(fact));
 }
 
 std::string FolderFact(const std::string& folder) {
   if (folder.empty()) return Tr("none");
   if (platform::IsFolder(folder)) return folder;
-  return platform::FileExists(folder) ? Tr("%1 (not a folder)", folder) : Tr("%1 (does not exist yet)", folder);
+  return platform::FileExists(folder) ? Tr("%1 (not a folder)", folder)
+                                      : Tr("%1 (does not exist yet)", folder);
 }
 
 void ReportConfiguration(ResultOutput& output) {
@@ -42,14 +44,19 @@ void ReportConfiguration(ResultOutput& output) {
   std::string path = ConfigurationPath();
   switch (StateOfConfiguration()) {
     case ConfigurationState::NotLoaded:
-    case ConfigurationState::Missing: path = Tr("%1 (does not exist; the defaults apply)", path); break;
-    case ConfigurationState::Unreadable: path = Tr("%1 (cannot be read; the defaults apply and nothing is saved)", path); break;
+    case ConfigurationState::Missing:
+      path = Tr("%1 (does not exist; the defaults apply)", path);
+      break;
+    case ConfigurationState::Unreadable:
+      path = Tr("%1 (cannot be read; the defaults apply and nothing is saved)", path);
+      break;
     case ConfigurationState::Loaded: break;
   }
   Report(output, Tr("Configuration"), path);
   for (const ValueComplaint& complaint : ConfigurationComplaints()) {
     Report(output, "  " + Tr("line %1", complaint.line),
-           std::string(complaint.row->name) + "=" + complaint.value + ": " + FaultMessage(*complaint.row, complaint.fault));
+           std::string(complaint.row->name) + "=" + complaint.value + ": " +
+               FaultMessage(*complaint.row, complaint.fault));
   }
 }
 
@@ -63,7 +70,8 @@ bool IsRegistered(const std::string& path) {
 // The formats of each module, and the modules without one.
 void ReportPlugins(ResultOutput& output, bool enabled) {
   const std::string folder = FolderFact(platform::JoinFolder(platform::ProgramFolder(), "plugin"));
-  Report(output, Tr("Plug-in folder"), enabled ? folder : Tr("%1 (disabled by --no-plugins)", folder));
+  Report(output, Tr("Plug-in folder"),
+         enabled ? folder : Tr("%1 (disabled by --no-plugins)", folder));
   if (!enabled) return;
   (void)ScanPlugins();
   std::map<std::string, std::string> formats;
@@ -71,12 +79,16 @@ void ReportPlugins(ResultOutput& output, bool enabled) {
     std::string& list = formats[std::string(PluginRow(i).path)];
     list += (list.empty() ? "" : " ") + UpperCase(PluginRow(i).extension);
   }
-  for (const auto& [path, list] : formats) Report(output, "  " + EscapeControls(platform::FileNameOf(path)), list);
+  for (const auto& [path, list] : formats)
+    Report(output, "  " + EscapeControls(platform::FileNameOf(path)), list);
   const std::string modules = platform::JoinFolder(platform::ProgramFolder(), "plugin");
-  for (const platform::FolderEntry& entry : platform::ListFolder(modules).value_or(std::vector<platform::FolderEntry>())) {
-    const bool module = UpperCase(entry.name).starts_with("FMWPL") && entry.name.ends_with(platform::kModuleExtension);
+  for (const platform::FolderEntry& entry :
+       platform::ListFolder(modules).value_or(std::vector<platform::FolderEntry>())) {
+    const bool module = UpperCase(entry.name).starts_with("FMWPL") &&
+                        entry.name.ends_with(platform::kModuleExtension);
     if (module && !IsRegistered(platform::JoinFolder(modules, entry.name))) {
-      Report(output, "  " + EscapeControls(entry.name), Tr("not used: not a module for this system, or it failed to start"));
+      Report(output, "  " + EscapeControls(entry.name),
+             Tr("not used: not a module for this system, or it failed to start"));
     }
   }
 }
@@ -95,7 +107,8 @@ void ReportFormats(ResultOutput& output) {
   }
   Report(output, Tr("Formats"), Tr("%1 can be read, %2 can be written", readable, writable));
   if (!off.empty()) output.Line(std::string("  ") + Tr("Disabled:") + off);
-  for (const auto& [reason, extensions] : reasons) output.Line("  " + reason.substr(0, reason.size() - 1) + ":" + extensions);
+  for (const auto& [reason, extensions] : reasons)
+    output.Line("  " + reason.substr(0, reason.size() - 1) + ":" + extensions);
 }
 
 int RunDoctor(const CommandContext& context) {
@@ -103,11 +116,13 @@ int RunDoctor(const CommandContext& context) {
   Report(output, Tr("Version"), FOTOMILL_VERSION);
   Report(output, Tr("Program"), platform::ProgramPath());
   ReportConfiguration(output);
-  Report(output, Tr("Temporary files"), FolderFact(platform::SpecialFolderPath(platform::SpecialFolder::Temporary)));
+  Report(output, Tr("Temporary files"),
+         FolderFact(platform::SpecialFolderPath(platform::SpecialFolder::Temporary)));
   Report(output, Tr("Cores"), std::to_string(platform::CoreCount()));
   ReportPlugins(output, !context.global.noPlugins);
   for (const Library& library : Libraries()) {
-    Report(output, Tr("Library"), Tr("%1 %2, for %3", library.name, library.version, Tr(library.purpose)));
+    Report(output, Tr("Library"),
+           Tr("%1 %2, for %3", library.name, library.version, Tr(library.purpose)));
   }
   ReportFormats(output);
   return kExitOk;

@@ -83,7 +83,8 @@ Outcome WriteThumbnail(std::span<const uint8_t> bytes, const ExifOptions& option
 Outcome WalkFile(const SelectedFile& file, const ExifOptions& options, ExifSink& sink) {
   if (file.status != Status::Ok) return {file.status, file.hint, {}};
   ExifSource source;
-  if (const Status status = source.Open(file.name.c_str()); status != Status::Ok) return {status, ReasonSentence(), {}};
+  if (const Status status = source.Open(file.name.c_str()); status != Status::Ok)
+    return {status, ReasonSentence(), {}};
   const auto block = source.Block();
   ExifFindings findings;
   if (!block.empty() && !WalkExif(block, &sink, &findings)) {
@@ -93,20 +94,24 @@ Outcome WalkFile(const SelectedFile& file, const ExifOptions& options, ExifSink&
   if (!options.thumbnail.empty()) outcome = WriteThumbnail(ExifThumbnail(block, findings), options);
   outcome.hasExif = !block.empty();
   outcome.cutShort = findings.cutShort;
-  if (!source.Intact()) return {Status::FileReadError, Tr("The file was truncated while it was read."), {}};
+  if (!source.Intact())
+    return {Status::FileReadError, Tr("The file was truncated while it was read."), {}};
   return outcome;
 }
 
 class ExifRun {
  public:
-  ExifRun(const ExifOptions& options, const CommandContext& context) : options_(options), output_(context, options.json) {}
+  ExifRun(const ExifOptions& options, const CommandContext& context)
+      : options_(options), output_(context, options.json) {}
 
   void ReportFiles(const std::vector<SelectedFile>& files) {
     for (const SelectedFile& file : files) {
       if (!output_.GoesOn()) return;
-      const Outcome outcome = options_.json ? ReportJson(file) : ReportLines(file, files.size() > 1);
+      const Outcome outcome =
+          options_.json ? ReportJson(file) : ReportLines(file, files.size() > 1);
       if (outcome.status != Status::Ok) {
-        output_.Failure(outcome.name.empty() ? file.name : outcome.name, outcome.status, outcome.hint);
+        output_.Failure(outcome.name.empty() ? file.name : outcome.name, outcome.status,
+                        outcome.hint);
         continue;
       }
       output_.CountFile();
@@ -114,7 +119,9 @@ class ExifRun {
       if (!outcome.hasExif && !options_.json) {
         output_.Note(output_.ShownMessage(file.name) + ": " + Tr("This file has no EXIF."));
       }
-      if (outcome.cutShort) output_.Note(output_.ShownMessage(file.name) + ": " + Tr("Not all EXIF entries are shown."));
+      if (outcome.cutShort)
+        output_.Note(output_.ShownMessage(file.name) + ": " +
+                     Tr("Not all EXIF entries are shown."));
     }
   }
 
@@ -148,7 +155,8 @@ class ExifRun {
   Outcome ReportLines(const SelectedFile& file, bool named) {
     lines_.Clear();
     Outcome outcome = WalkFile(file, options_, lines_);
-    if (outcome.status == Status::Ok && !lines_.Complete()) outcome.status = Status::MemoryAllocationError;
+    if (outcome.status == Status::Ok && !lines_.Complete())
+      outcome.status = Status::MemoryAllocationError;
     if (lines_.Text().empty()) return outcome;
     text_.clear();
     if (named) text_.append(output_.Shown(file.name)).append("\n");
@@ -180,7 +188,8 @@ bool ReadPlace(std::string_view text, double* degrees) {
 
 bool IsSameFile(const std::string& one, const std::string& other) {
   const platform::FileFacts a = platform::FactsOf(one), b = platform::FactsOf(other);
-  return a.kind == platform::FileKind::Regular && b.kind == a.kind && a.device == b.device && a.identity == b.identity;
+  return a.kind == platform::FileKind::Regular && b.kind == a.kind && a.device == b.device &&
+         a.identity == b.identity;
 }
 
 int RunExif(const ExifOptions& options, const CommandContext& context) {
@@ -188,14 +197,17 @@ int RunExif(const ExifOptions& options, const CommandContext& context) {
   const bool measures = !options.distance.empty();
   for (size_t i = 0; i < options.distance.size(); ++i) {
     if (!ReadPlace(options.distance[i], degrees + 2 * i)) {
-      return UsageError(context, Tr("\"%1\" is not LAT,LON in decimal degrees.", options.distance[i]));
+      return UsageError(context,
+                        Tr("\"%1\" is not LAT,LON in decimal degrees.", options.distance[i]));
     }
   }
-  const bool alone = measures && context.names.values.empty() && options.selection.filesFrom.empty();
+  const bool alone =
+      measures && context.names.values.empty() && options.selection.filesFrom.empty();
   const auto files = alone ? std::vector<SelectedFile>{} : SelectFiles(options.selection, context);
   if (!files) return kExitUsage;
   if (!options.thumbnail.empty()) {
-    if (files->size() != 1) return UsageError(context, Tr("--thumbnail takes exactly one picture."));
+    if (files->size() != 1)
+      return UsageError(context, Tr("--thumbnail takes exactly one picture."));
     if (IsSameFile(files->front().name, options.thumbnail)) {
       return UsageError(context, Tr("--thumbnail names the picture itself."));
     }
@@ -212,9 +224,10 @@ void SetUpExif(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<ExifOptions>();
   AddSelection(app, options->selection, context);
   AddFlag(app, "--json", options->json, "Print a JSON array with one object per file");
-  AddName(app, "--thumbnail", options->thumbnail, "OUT", "Extract the embedded thumbnail to this file, unchanged");
-  AddChoice(app, "--overwrite", options->overwrite, "HOW", "If the output exists: refuse (default) or replace",
-            {"refuse", "replace"});
+  AddName(app, "--thumbnail", options->thumbnail, "OUT",
+          "Extract the embedded thumbnail to this file, unchanged");
+  AddChoice(app, "--overwrite", options->overwrite, "HOW",
+            "If the output exists: refuse (default) or replace", {"refuse", "replace"});
   AddTexts(app, "--distance", options->distance, 2, "LAT,LON LAT,LON",
            "Print the distance between two places in decimal degrees; ExifDistinceUnits sets the unit");
   SetFooter(app, "Reads JPEG, TIFF, HD Photo, PNG and WebP files and bare EXIF blocks.",

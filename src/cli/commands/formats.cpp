@@ -41,8 +41,8 @@ Json RowAsJson(int32_t index) {
 std::string RowAsText(int32_t index) {
   const FormatEntry& row = FormatRow(index);
   char front[48];
-  std::snprintf(front, sizeof front, "%2d  %-6.6s  %-5s %-5s  ", index, row.extension.c_str(), CanRead(row) ? "read" : "",
-                CanWrite(row) ? "write" : "");
+  std::snprintf(front, sizeof front, "%2d  %-6.6s  %-5s %-5s  ", index, row.extension.c_str(),
+                CanRead(row) ? "read" : "", CanWrite(row) ? "write" : "");
   std::string line = EscapeControls(front) + EscapeControls(row.description);
   if (row.enabled == 0) line += std::string(" ") + Tr("(disabled)");
   return line;
@@ -50,7 +50,8 @@ std::string RowAsText(int32_t index) {
 
 std::string PluginAsText(const PluginFormatFacts& format) {
   char front[48];
-  std::snprintf(front, sizeof front, "    %-6.6s  read  %-5s  ", format.extension.c_str(), format.canWrite ? "write" : "");
+  std::snprintf(front, sizeof front, "    %-6.6s  read  %-5s  ", format.extension.c_str(),
+                format.canWrite ? "write" : "");
   return EscapeControls(front) + EscapeControls(PluginDescription(format));
 }
 
@@ -59,7 +60,8 @@ int RunFormats(const FormatsOptions& options, const CommandContext& context) {
   if (options.destinations) {
     for (const std::string& extension : DestinationExtensions()) output.Line(extension);
   } else if (options.filter) {
-    for (const FilterPair& pair : OpenFileFilter()) output.Line(pair.description + "\t" + pair.patterns);
+    for (const FilterPair& pair : OpenFileFilter())
+      output.Line(pair.description + "\t" + pair.patterns);
   } else {
     for (int32_t index = 0; index < formatCount; ++index) {
       if (output.IsJson()) {
@@ -79,14 +81,18 @@ int RunFormats(const FormatsOptions& options, const CommandContext& context) {
 
 void SetUpFormats(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<FormatsOptions>();
-  CLI::Option* json = AddFlag(app, "--json", options->json, "Print a JSON array with one object per format");
-  CLI::Option* destinations = AddFlag(app, "--destinations", options->destinations, "List the output formats, one per line");
+  CLI::Option* json =
+      AddFlag(app, "--json", options->json, "Print a JSON array with one object per format");
+  CLI::Option* destinations = AddFlag(app, "--destinations", options->destinations,
+                                      "List the output formats, one per line");
   CLI::Option* filter =
-      AddFlag(app, "--filter", options->filter, "List the file filters of the Open dialog: description, tab, patterns");
+      AddFlag(app, "--filter", options->filter,
+              "List the file filters of the Open dialog: description, tab, patterns");
   Exclude(destinations, json);
   Exclude(destinations, filter);
   Exclude(filter, json);
-  SetFooter(app, "Columns: index, extension, what this build can do, description.", "fotomill formats --json");
+  SetFooter(app, "Columns: index, extension, what this build can do, description.",
+            "fotomill formats --json");
   context.run = [options, &context] { return RunFormats(*options, context); };
 }
 

@@ -28,7 +28,8 @@ struct HistoryOptions {
   bool dryRun = false;
 };
 
-constexpr const char* kNotRead = TrLater("Not a readable file history; left unchanged. \"history clear\" deletes it.");
+constexpr const char* kNotRead =
+    TrLater("Not a readable file history; left unchanged. \"history clear\" deletes it.");
 constexpr const char* kNotWritten = TrLater("The file history could not be written.");
 constexpr const char* kOff = TrLater("The file history is disabled.");
 
@@ -42,8 +43,8 @@ int Complain(const CommandContext& context, const char* message) {
 std::string TimeText(int64_t seconds) {
   const platform::LocalTime time = platform::LocalTimeOf(seconds);
   char text[40];
-  std::snprintf(text, sizeof text, "%04d-%02d-%02d %02d:%02d:%02d", time.year, time.month, time.day, time.hour, time.minute,
-                time.second);
+  std::snprintf(text, sizeof text, "%04d-%02d-%02d %02d:%02d:%02d", time.year, time.month, time.day,
+                time.hour, time.minute, time.second);
   return text;
 }
 
@@ -69,7 +70,8 @@ int RunList(const HistoryOptions& options, const CommandContext& context) {
   }
   ClearFileHistory();
   if (settings.FileHistoryEnable == 0) output.Note(Tr(kOff));
-  const bool broken = !read && settings.FileHistoryEnable != 0 && !path.empty() && platform::FileExists(path);
+  const bool broken =
+      !read && settings.FileHistoryEnable != 0 && !path.empty() && platform::FileExists(path);
   return broken ? Complain(context, kNotRead) : kExitOk;
 }
 
@@ -83,7 +85,8 @@ int32_t FunctionOf(const std::string& text) {
 std::string UnknownFunction(const std::string& text) {
   std::vector<std::string_view> names;
   for (int32_t i = 0; i < kFileFunctionCount; ++i) names.push_back(FileFunctionName(i));
-  return Tr("Unknown function \"%1\"; use a number from 0 to %2 or a name.", text, kFileFunctionCount - 1) +
+  return Tr("Unknown function \"%1\"; use a number from 0 to %2 or a name.", text,
+            kFileFunctionCount - 1) +
          NearestNameHint(text, names);
 }
 
@@ -92,7 +95,8 @@ int RunAdd(const HistoryOptions& options, const CommandContext& context) {
   if (function == kNoFileFunction) return UsageError(context, UnknownFunction(options.function));
   ResultOutput output(context, options.json);
   const std::string& name = context.names.values[0];
-  const FileUse use{platform::AbsolutePath(name), static_cast<FileFunction>(function), options.created, options.accessed, false};
+  const FileUse use{platform::AbsolutePath(name), static_cast<FileFunction>(function),
+                    options.created, options.accessed, false};
   Status status = Status::Ok;
   std::string hint;
   if (!platform::IsRegularFile(use.path)) {
@@ -117,7 +121,8 @@ int RunAdd(const HistoryOptions& options, const CommandContext& context) {
     case HistoryUpdate::Failed: return Complain(context, kNotWritten);
     case HistoryUpdate::Done: break;
   }
-  if (recorded == 0) output.Note(line + Tr("not recorded; FileHistoryFunctions excludes this function."));
+  if (recorded == 0)
+    output.Note(line + Tr("not recorded; FileHistoryFunctions excludes this function."));
   return kExitOk;
 }
 
@@ -129,12 +134,15 @@ int RunClear(const HistoryOptions& options, const CommandContext& context) {
     ResultOutput(context, false).Note(path + ": " + Tr("would be deleted."));
     return kExitOk;
   }
-  return platform::DeleteFile(path) ? kExitOk : Complain(context, TrLater("The file history could not be deleted."));
+  return platform::DeleteFile(path)
+             ? kExitOk
+             : Complain(context, TrLater("The file history could not be deleted."));
 }
 
 using Run = int (*)(const HistoryOptions& options, const CommandContext& context);
 
-std::shared_ptr<HistoryOptions> SetUp(CLI::App& app, CommandContext& context, Run run, const char* example) {
+std::shared_ptr<HistoryOptions> SetUp(CLI::App& app, CommandContext& context, Run run,
+                                      const char* example) {
   auto options = std::make_shared<HistoryOptions>();
   SetFooter(app, nullptr, example);
   context.run = [options, &context, run] { return run(*options, context); };
@@ -145,12 +153,14 @@ std::shared_ptr<HistoryOptions> SetUp(CLI::App& app, CommandContext& context, Ru
 
 void SetUpHistoryList(CLI::App& app, CommandContext& context) {
   const auto options = SetUp(app, context, RunList, "fotomill history list --json");
-  AddFlag(app, "--json", options->json, "Print a JSON array of {path, function, functionName, created, accessed, size}");
+  AddFlag(app, "--json", options->json,
+          "Print a JSON array of {path, function, functionName, created, accessed, size}");
 }
 
 void SetUpHistoryAdd(CLI::App& app, CommandContext& context) {
   context.names.Declare("FILE", "The file that was used", 1, 1);
-  const auto options = SetUp(app, context, RunAdd, "fotomill history add photo.jpg --function View");
+  const auto options =
+      SetUp(app, context, RunAdd, "fotomill history add photo.jpg --function View");
   Require(AddName(app, "--function", options->function, "NAME|N",
                   "What was done with it: a name such as \"Get info\", or a number from 0 to 19"));
   AddNumber(app, "--created", options->created, "SECONDS", INT32_MIN, INT32_MAX,

@@ -33,7 +33,9 @@ std::string Resolution(double pixelsPerInch) {
 // Frame durations and the number of rounds, 0 for endless.
 void AddFrames(const PictureRecord& picture, Json& facts) {
   AnimationPointer animation;
-  if (picture.pageCount < 2 || OpenAnimation({.fileName = picture.fileName.c_str()}, animation) != Status::Ok) return;
+  if (picture.pageCount < 2 ||
+      OpenAnimation({.fileName = picture.fileName.c_str()}, animation) != Status::Ok)
+    return;
   facts["delaysMs"] = animation->Delays();
   facts["rounds"] = animation->Rounds();
 }
@@ -52,7 +54,8 @@ Json FactsAsJson(const PictureRecord& picture) {
   facts["fileSize"] = picture.fileSize;
   facts["imageBytes"] = picture.imageBytes;
   facts["details"] = Json::array();
-  for (size_t i = 0; i < picture.detailLines.Count(); ++i) facts["details"].push_back(picture.detailLines.Line(i));
+  for (size_t i = 0; i < picture.detailLines.Count(); ++i)
+    facts["details"].push_back(picture.detailLines.Line(i));
   facts["pages"] = picture.pageCount;
   AddFrames(picture, facts);
   if (picture.metadata.dpiX > 0) facts["dpiX"] = picture.metadata.dpiX;
@@ -74,12 +77,15 @@ std::string FactsAsText(const PictureRecord& picture) {
   AddFact(text, Tr("Format"), row.description.view());
   if (!picture.typeName.empty()) AddFact(text, Tr("Type"), picture.typeName.view());
   AddFact(text, Tr("Dimensions"), Tr("%1 x %2 pixels", picture.width, picture.height));
-  const std::string depth = TrCount("%1 bit", "%1 bits", static_cast<uint64_t>(picture.bitsPerPixel));
-  AddFact(text, Tr("Depth"), (picture.alphaFlags & kHasAlpha) != 0 ? Tr("%1 and alpha", depth) : depth);
+  const std::string depth =
+      TrCount("%1 bit", "%1 bits", static_cast<uint64_t>(picture.bitsPerPixel));
+  AddFact(text, Tr("Depth"),
+          (picture.alphaFlags & kHasAlpha) != 0 ? Tr("%1 and alpha", depth) : depth);
   if (picture.pageCount > 1) AddFact(text, Tr("Pages"), std::to_string(picture.pageCount));
   if (picture.metadata.dpiX > 0 && picture.metadata.dpiY > 0) {
     AddFact(text, Tr("Resolution"),
-            Tr("%1 x %2 pixels per inch", Resolution(picture.metadata.dpiX), Resolution(picture.metadata.dpiY)));
+            Tr("%1 x %2 pixels per inch", Resolution(picture.metadata.dpiX),
+               Resolution(picture.metadata.dpiY)));
   }
   AddFact(text, Tr("File size"), TrCount("%1 byte", "%1 bytes", picture.fileSize));
   AddFact(text, Tr("Image data"), TrCount("%1 byte", "%1 bytes", picture.imageBytes));
@@ -101,7 +107,8 @@ Status GatherFacts(const SelectedFile& file, PicturePointer& picture) {
 void ReportFile(const SelectedFile& file, ResultOutput& output, UsedFiles& used) {
   PicturePointer picture;
   const Status status = GatherFacts(file, picture);
-  const std::string hint = status == Status::Ok || !file.hint.empty() ? file.hint : OpenHint(file.name, status);
+  const std::string hint =
+      status == Status::Ok || !file.hint.empty() ? file.hint : OpenHint(file.name, status);
   if (output.IsJson()) {
     Json element;
     PutName(element, "file", file.name);

@@ -56,7 +56,8 @@ void SetUpMatch(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<MatchOptions>();
   context.names.Declare("NAME...", "File names; they need not exist", 1);
   AddFlag(app, "--json", options->json, "Print a JSON array of {name, index, extension, typeName}");
-  SetFooter(app, "The exit status is 1 if a name selects no format.", "fotomill match scan.tiff photo.jpeg");
+  SetFooter(app, "The exit status is 1 if a name selects no format.",
+            "fotomill match scan.tiff photo.jpeg");
   context.run = [options, &context] { return RunMatch(*options, context); };
 }
 

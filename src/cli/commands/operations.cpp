@@ -51,8 +51,12 @@ Json Described(const Parameter& row) {
 Json Described(const Operation& operation) {
   Json parameters = Json::array();
   for (const Parameter& row : operation.parameters) parameters.push_back(Described(row));
-  return {{"name", operation.name},   {"family", FamilyName(operation.family)}, {"label", operation.label},
-          {"help", operation.help},   {"works", WorksName(operation.works)},    {"parameters", std::move(parameters)},
+  return {{"name", operation.name},
+          {"family", FamilyName(operation.family)},
+          {"label", operation.label},
+          {"help", operation.help},
+          {"works", WorksName(operation.works)},
+          {"parameters", std::move(parameters)},
           {"example", operation.example}};
 }
 
@@ -78,7 +82,8 @@ std::string Takes(const Parameter& row) {
     return words;
   }
   std::string takes(KindName(row.kind));
-  if (HasLimits(row) && row.most < 1e9) takes += " " + Number(row.least) + " to " + Number(row.most);
+  if (HasLimits(row) && row.most < 1e9)
+    takes += " " + Number(row.least) + " to " + Number(row.most);
   if (*row.unit != '\0') takes.append(" ").append(row.unit);
   return takes;
 }
@@ -98,7 +103,8 @@ void Explain(const Operation& operation, ResultOutput& output) {
     std::string line = "  " + Padded(row.name, 12) + " " + Tr(row.help);
     output.Line(line);
     line = "  " + Padded("", 12) + " " + Takes(row);
-    if (!preset || !preset->empty()) line.append("; ").append(preset ? Tr("default %1", *preset) : Tr("required"));
+    if (!preset || !preset->empty())
+      line.append("; ").append(preset ? Tr("default %1", *preset) : Tr("required"));
     output.Line(line);
   }
   output.Line("");
@@ -112,7 +118,9 @@ int RunOperations(bool json, const CommandContext& context) {
     one = FindOperation(name);
     std::vector<std::string_view> names;
     for (const Operation* operation : Operations()) names.emplace_back(operation->name);
-    if (one == nullptr) return UsageError(context, Tr("Unknown operation \"%1\".", name) + NearestNameHint(name, names));
+    if (one == nullptr)
+      return UsageError(context,
+                        Tr("Unknown operation \"%1\".", name) + NearestNameHint(name, names));
   }
   ResultOutput output(context, json);
   if (one != nullptr && !json) {
@@ -127,7 +135,8 @@ int RunOperations(bool json, const CommandContext& context) {
       output.Element(Described(*operation));
       continue;
     }
-    if (first || operation->family != family) output.Line(std::string(first ? "" : "\n") + std::string(FamilyName(operation->family)));
+    if (first || operation->family != family)
+      output.Line(std::string(first ? "" : "\n") + std::string(FamilyName(operation->family)));
     family = operation->family;
     first = false;
     output.Line("  " + Padded(operation->name, 16) + Tr(operation->help));

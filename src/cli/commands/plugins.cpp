@@ -37,8 +37,8 @@ int RunPlugins(const PluginsOptions& options, const CommandContext& context) {
       output.Element(EntryAsJson(entry));
     } else {
       const char* writes = entry.exports.writeImage != nullptr ? "read, write" : "read";
-      output.Line(output.Shown(entry.extension) + "\t" + writes + "\t" + output.Shown(entry.textA) + "\t" +
-                  output.Shown(entry.path));
+      output.Line(output.Shown(entry.extension) + "\t" + writes + "\t" + output.Shown(entry.textA) +
+                  "\t" + output.Shown(entry.path));
     }
   }
   if (PluginFormatCount() == 0) output.Note(Tr("No plug-ins are loaded."));
@@ -51,7 +51,8 @@ void SetUpPlugins(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<PluginsOptions>();
   AddFlag(app, "--json", options->json,
           "Print a JSON array of {path, extension, textA, textB, flags1, flags2, canRead, canWrite}");
-  SetFooter(app, "Modules are loaded from the folder \"plugin\" beside the program.", "fotomill plugins --json");
+  SetFooter(app, "Modules are loaded from the folder \"plugin\" beside the program.",
+            "fotomill plugins --json");
   context.run = [options, &context] { return RunPlugins(*options, context); };
 }
 

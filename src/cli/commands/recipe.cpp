@@ -29,9 +29,11 @@ int RunList(bool json, const CommandContext& context) {
   for (const NamedRecipe& named : ListRecipes()) {
     std::string text, path;
     Recipe recipe;
-    const bool right = FindRecipe(named.path.empty() ? named.name : named.path, text, path).empty() &&
-                       ReadRecipe(text, KeyTextInForce, recipe).empty();
-    const std::vector<std::string> names = right ? OperationsOf(recipe) : std::vector<std::string>();
+    const bool right =
+        FindRecipe(named.path.empty() ? named.name : named.path, text, path).empty() &&
+        ReadRecipe(text, KeyTextInForce, recipe).empty();
+    const std::vector<std::string> names =
+        right ? OperationsOf(recipe) : std::vector<std::string>();
     if (json) {
       Json element;
       PutName(element, "name", named.name);
@@ -49,7 +51,8 @@ int RunList(bool json, const CommandContext& context) {
 
 int RunShow(bool json, const CommandContext& context) {
   std::string text, path;
-  if (const std::string wrong = FindRecipe(context.names.values[0], text, path); !wrong.empty()) return UsageError(context, wrong);
+  if (const std::string wrong = FindRecipe(context.names.values[0], text, path); !wrong.empty())
+    return UsageError(context, wrong);
   ResultOutput output(context, json);
   if (json) {
     Json element;
@@ -80,7 +83,10 @@ int RunCheck(bool json, const CommandContext& context) {
     for (const Mistake& mistake : mistakes) {
       status = kExitUsage;
       if (json) {
-        output.Element({{"line", mistake.line}, {"operation", mistake.operation}, {"parameter", mistake.parameter}, {"message", mistake.message}});
+        output.Element({{"line", mistake.line},
+                        {"operation", mistake.operation},
+                        {"parameter", mistake.parameter},
+                        {"message", mistake.message}});
       } else {
         output.Message(output.ShownMessage(name + ": " + mistake.Text()));
       }
@@ -94,7 +100,9 @@ int RunCheck(bool json, const CommandContext& context) {
 void SetUpRecipeList(CLI::App& app, CommandContext& context) {
   auto json = std::make_shared<bool>(false);
   AddFlag(app, "--json", *json, "Print a JSON array of {name, path, operations}");
-  SetFooter(app, "Recipes are the files NAME.recipe in the folder \"recipes\" of the data folder, and six built-in ones.",
+  SetFooter(app,
+            "Recipes are the files NAME.recipe in the folder \"recipes\" of the data folder, and "
+            "six built-in ones.",
             "fotomill recipe list");
   context.run = [json, &context] { return RunList(*json, context); };
 }
@@ -111,7 +119,8 @@ void SetUpRecipeCheck(CLI::App& app, CommandContext& context) {
   auto json = std::make_shared<bool>(false);
   context.names.Declare("FILE...", "Recipes to check", 1);
   AddFlag(app, "--json", *json, "Print a JSON array of {line, operation, parameter, message}");
-  SetFooter(app, "The exit status is 2 if a recipe has mistakes.", "fotomill recipe check holiday.recipe");
+  SetFooter(app, "The exit status is 2 if a recipe has mistakes.",
+            "fotomill recipe check holiday.recipe");
   context.run = [json, &context] { return RunCheck(*json, context); };
 }
 

@@ -28,11 +28,14 @@ struct RenameCommandOptions {
   bool json = false;
 };
 
-int RunUndo(const RenameCommandOptions& options, const std::vector<SelectedFile>& files, ResultOutput& output, BatchJob& job) {
+int RunUndo(const RenameCommandOptions& options, const std::vector<SelectedFile>& files,
+            ResultOutput& output, BatchJob& job) {
   std::set<std::string> only;
   for (const SelectedFile& file : files) only.insert(platform::AbsolutePath(file.name));
   if (UndoRename(only, options.dryRun, job)) return kExitOk;
-  output.Message(std::string("fotomill: ") + WithReason(Tr("The record of the last renaming in the data folder cannot be read.")));
+  output.Message(
+      std::string("fotomill: ") +
+      WithReason(Tr("The record of the last renaming in the data folder cannot be read.")));
   return kExitFailed;
 }
 
@@ -65,11 +68,14 @@ int RunRenameCommand(const RenameCommandOptions& options, const CommandContext& 
 void SetUpRename(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<RenameCommandOptions>();
   AddSelection(app, options->selection, context);
-  AddFlag(app, "--undo", options->undo, "Undo the last renaming, of all files or of the named ones");
+  AddFlag(app, "--undo", options->undo,
+          "Undo the last renaming, of all files or of the named ones");
   AddNumber(app, "--digits", options->digits, "N", 1, 10, "Digits of the numbers (default: 4)");
-  AddNumber(app, "--seed", options->seed, "N", 0, INT32_MAX, "Seed of SequentialRenameRandom: the same seed, the same order");
+  AddNumber(app, "--seed", options->seed, "N", 0, INT32_MAX,
+            "Seed of SequentialRenameRandom: the same seed, the same order");
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be done");
-  AddFlag(app, "--json", options->json, "Print a JSON array of {file, destination, status, message}");
+  AddFlag(app, "--json", options->json,
+          "Print a JSON array of {file, destination, status, message}");
   SetFooter(app,
             "The names follow the configuration keys that begin with SequentialRename: BaseName, BaseNumber, Increment,\n"
             "MaxAttempts, Sep, Hyphen, Prefix, Random, SkipCollide and Update.",

@@ -42,12 +42,17 @@ constexpr const char* kExists = TrLater("The file exists; use --overwrite replac
 constexpr size_t kAddedAtOnce = 64;  // pictures, about 2 MB
 
 // Opens a database; false after a message.
-bool OpenDatabase(ThumbnailDatabase& database, const std::string& path, bool create, ResultOutput& output) {
+bool OpenDatabase(ThumbnailDatabase& database, const std::string& path, bool create,
+                  ResultOutput& output) {
   switch (database.OpenThumbnailDatabase(path, create, ThumbnailOptionsFromSettings().hidden)) {
     case ThumbnailDatabase::Opened::Done: return true;
     case ThumbnailDatabase::Opened::Missing: output.Failure(path, Status::FileOpenError); break;
-    case ThumbnailDatabase::Opened::NotRead: output.Failure(path, Status::DamagedFile, Tr(kNoDatabase)); break;
-    case ThumbnailDatabase::Opened::Failed: output.Failure(path, Status::ErrorCreatingFile, ReasonSentence()); break;
+    case ThumbnailDatabase::Opened::NotRead:
+      output.Failure(path, Status::DamagedFile, Tr(kNoDatabase));
+      break;
+    case ThumbnailDatabase::Opened::Failed:
+      output.Failure(path, Status::ErrorCreatingFile, ReasonSentence());
+      break;
   }
   return false;
 }
@@ -77,7 +82,8 @@ Adding MakeRecord(const SelectedFile& file, const ThumbnailOptions& options) {
 // Appends records in blocks, since each append waits for the disk.
 class Appending {
  public:
-  Appending(ThumbnailDatabase& database, ResultOutput& output) : database_(database), output_(output) {}
+  Appending(ThumbnailDatabase& database, ResultOutput& output)
+      : database_(database), output_(output) {}
 
   void Add(const SelectedFile& file, Adding& adding) {
     if (adding.status != Status::Ok) {
@@ -113,7 +119,8 @@ class Appending {
   std::vector<DatabaseRecord> records_;
 };
 
-int AddFiles(const std::vector<SelectedFile>& files, uint32_t jobs, ThumbnailDatabase& database, ResultOutput& output) {
+int AddFiles(const std::vector<SelectedFile>& files, uint32_t jobs, ThumbnailDatabase& database,
+             ResultOutput& output) {
   const ThumbnailOptions options = ThumbnailOptionsFromSettings();
   Appending appending(database, output);
   std::vector<Adding> addings(files.size());
@@ -160,7 +167,8 @@ int RunAdd(const TdbOptions& options, CommandContext& context) {
   }
   ThumbnailDatabase database;
   if (!OpenDatabase(database, path, true, output)) return output.Finish();
-  const uint32_t jobs = options.jobs == 0 ? platform::CoreCount() : static_cast<uint32_t>(options.jobs);
+  const uint32_t jobs =
+      options.jobs == 0 ? platform::CoreCount() : static_cast<uint32_t>(options.jobs);
   return AddFiles(*files, jobs, database, output);
 }
 
@@ -188,8 +196,12 @@ int RunFind(const TdbOptions& options, CommandContext& context) {
   return output.Finish();
 }
 
-void PrintJson(const CommandContext& context, const ThumbnailDatabase& database, const DatabaseHeader& header) {
-  Json object{{"version", header.version}, {"count", header.count}, {"created", header.created}, {"appended", header.appended}};
+void PrintJson(const CommandContext& context, const ThumbnailDatabase& database,
+               const DatabaseHeader& header) {
+  Json object{{"version", header.version},
+              {"count", header.count},
+              {"created", header.created},
+              {"appended", header.appended}};
   object["records"] = Json::array();
   DatabaseKey key;
   for (int64_t i = 0; i < database.RecordCount(header); ++i) {
@@ -216,7 +228,8 @@ int RunList(const TdbOptions& options, CommandContext& context) {
   }
   if (header.count != database.RecordCount(header)) {
     output.Note(output.ShownMessage(path) + ": " +
-                Tr("The header counts %1 records, but the file has %2.", header.count, database.RecordCount(header)));
+                Tr("The header counts %1 records, but the file has %2.", header.count,
+                   database.RecordCount(header)));
   }
   if (options.json) {
     PrintJson(context, database, header);
@@ -225,8 +238,8 @@ int RunList(const TdbOptions& options, CommandContext& context) {
   DatabaseKey key;
   for (int64_t i = 0; i < database.RecordCount(header) && output.GoesOn(); ++i) {
     if (!database.ReadKey(i, key)) continue;
-    output.Line(std::to_string(i) + "\t" + (key.deleted ? "deleted" : "live") + "\t" + output.Shown(key.volume) + "\t" +
-                output.Shown(key.path));
+    output.Line(std::to_string(i) + "\t" + (key.deleted ? "deleted" : "live") + "\t" +
+                output.Shown(key.volume) + "\t" + output.Shown(key.path));
   }
   return kExitOk;
 }
@@ -250,9 +263,12 @@ int RunDelete(const TdbOptions& options, CommandContext& context) {
   for (size_t i = 1; i < context.names.values.size() && output.GoesOn(); ++i) {
     const std::string& name = context.names.values[i];
     const std::string picture = platform::AbsolutePath(name);
-    const int64_t deleted =
-        options.dryRun ? CountRecords(database, [&](const DatabaseKey& key) { return !key.deleted && key.path == picture; })
-                       : database.Delete(picture);
+    const int64_t deleted = options.dryRun
+                                ? CountRecords(database,
+                                               [&](const DatabaseKey& key) {
+                                                 return !key.deleted && key.path == picture;
+                                               })
+                                : database.Delete(picture);
     if (deleted < 1) {
       output.Failure(name, deleted == 0 ? Status::NoImages : Status::ErrorWritingFile,
                      deleted == 0 ? Tr(kNotFound) : "");
@@ -284,28 +300,32 @@ int RunCompact(const TdbOptions& options, CommandContext& context) {
   const bool read = database.ReadDatabaseHeader(before);
   if (options.dryRun) {
     const int64_t kept = CountRecords(database, [&](const DatabaseKey& key) {
-      return !key.deleted && !(options.purge && !platform::FileExists(key.path) && PurgesMissing(key));
+      return !key.deleted &&
+             !(options.purge && !platform::FileExists(key.path) && PurgesMissing(key));
     });
     output.Line(Tr("%1 -> %2 records", before.count, kept));
     return kExitOk;
   }
   CompactionProgress progress(output);
   const ThumbnailDatabase::Compacted result =
-      read ? database.CompactThumbnailDatabase(options.purge, &progress) : ThumbnailDatabase::Compacted::NotRead;
+      read ? database.CompactThumbnailDatabase(options.purge, &progress)
+           : ThumbnailDatabase::Compacted::NotRead;
   if (result == ThumbnailDatabase::Compacted::Done && database.ReadDatabaseHeader(after)) {
     output.Line(Tr("%1 -> %2 records", before.count, after.count));
     return kExitOk;
   }
-  const Status status = result == ThumbnailDatabase::Compacted::NotRead   ? Status::FileReadError
-                        : result == ThumbnailDatabase::Compacted::Stopped ? Status::FunctionCancelled
-                                                                          : Status::ErrorWritingFile;
+  const Status status = result == ThumbnailDatabase::Compacted::NotRead ? Status::FileReadError
+                        : result == ThumbnailDatabase::Compacted::Stopped
+                            ? Status::FunctionCancelled
+                            : Status::ErrorWritingFile;
   output.Failure(path, status, Tr("The database was left unchanged."));
   return kExitFailed;
 }
 
 using Run = int (*)(const TdbOptions& options, CommandContext& context);
 
-std::shared_ptr<TdbOptions> SetUp(CLI::App& app, CommandContext& context, Run run, const char* notes, const char* example) {
+std::shared_ptr<TdbOptions> SetUp(CLI::App& app, CommandContext& context, Run run,
+                                  const char* notes, const char* example) {
   auto options = std::make_shared<TdbOptions>();
   SetFooter(app, notes, example);
   context.run = [options, &context, run] { return run(*options, context); };
@@ -316,39 +336,46 @@ std::shared_ptr<TdbOptions> SetUp(CLI::App& app, CommandContext& context, Run ru
 
 void SetUpTdbAdd(CLI::App& app, CommandContext& context) {
   const auto options = SetUp(app, context, RunAdd,
-                             TrLater("The database is created if needed. If it already has the picture, the earlier record is\n"
+                             TrLater("The database is created if needed. If it already has the "
+                                     "picture, the earlier record is\n"
                                      "marked as deleted."),
                              "fotomill tdb add Fotomill.tdb holiday --recursive");
   AddSelection(app, options->selection, context);
   context.names.Declare("DB FILE...", "The database, and picture files or folders of pictures", 1);
-  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, 256, "Number of parallel jobs (default: 0, one per core)");
+  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, 256,
+            "Number of parallel jobs (default: 0, one per core)");
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be added");
 }
 
 void SetUpTdbFind(CLI::App& app, CommandContext& context) {
-  const auto options = SetUp(app, context, RunFind, nullptr, "fotomill tdb find Fotomill.tdb holiday/beach.jpg --out beach.THN");
+  const auto options = SetUp(app, context, RunFind, nullptr,
+                             "fotomill tdb find Fotomill.tdb holiday/beach.jpg --out beach.THN");
   context.names.Declare("DB PATH", "The database, and the path of a picture", 2, 2);
   Require(AddName(app, "-o,--out", options->out, "FILE.THN", "Thumbnail file to write"));
-  AddChoice(app, "--overwrite", options->overwrite, "HOW", "If the output exists: refuse (default) or replace",
-            {"refuse", "replace"});
+  AddChoice(app, "--overwrite", options->overwrite, "HOW",
+            "If the output exists: refuse (default) or replace", {"refuse", "replace"});
 }
 
 void SetUpTdbList(CLI::App& app, CommandContext& context) {
-  const auto options = SetUp(app, context, RunList, nullptr, "fotomill tdb list Fotomill.tdb --json");
+  const auto options =
+      SetUp(app, context, RunList, nullptr, "fotomill tdb list Fotomill.tdb --json");
   context.names.Declare("DB", "The database", 1, 1);
   AddFlag(app, "--json", options->json,
           "Print a JSON object {version, count, created, appended, records: [{index, path, volume, deleted}]}");
 }
 
 void SetUpTdbDelete(CLI::App& app, CommandContext& context) {
-  const auto options = SetUp(app, context, RunDelete, TrLater("Records are only marked as deleted; \"tdb compact\" removes them."),
-                             "fotomill tdb delete Fotomill.tdb holiday/beach.jpg");
+  const auto options =
+      SetUp(app, context, RunDelete,
+            TrLater("Records are only marked as deleted; \"tdb compact\" removes them."),
+            "fotomill tdb delete Fotomill.tdb holiday/beach.jpg");
   context.names.Declare("DB PATH...", "The database, and paths of pictures", 2);
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be deleted");
 }
 
 void SetUpTdbCompact(CLI::App& app, CommandContext& context) {
-  const auto options = SetUp(app, context, RunCompact, nullptr, "fotomill tdb compact Fotomill.tdb --purge");
+  const auto options =
+      SetUp(app, context, RunCompact, nullptr, "fotomill tdb compact Fotomill.tdb --purge");
   context.names.Declare("DB", "The database", 1, 1);
   AddFlag(app, "--purge", options->purge,
           "Also remove thumbnails of missing pictures, except on network, optical and removable drives");

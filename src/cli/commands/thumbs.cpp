@@ -54,7 +54,8 @@ ThumbnailState StateOf(const std::string& picture) {
   if (facts.kind == platform::FileKind::Missing) return ThumbnailState::Missing;
   ThumbnailRecord record;
   if (!ReadThumbnailFile(record, path)) return ThumbnailState::Broken;
-  return facts.modified < platform::FactsOf(picture).modified ? ThumbnailState::Stale : ThumbnailState::Current;
+  return facts.modified < platform::FactsOf(picture).modified ? ThumbnailState::Stale
+                                                              : ThumbnailState::Current;
 }
 
 const char* NameOf(ThumbnailState state) {
@@ -70,7 +71,9 @@ const char* NameOf(ThumbnailState state) {
 Status MakeThumbnail(const std::string& name, const ThumbnailOptions& options) {
   ThumbnailRecord record;
   RETURN_IF_BAD(MakeThumbnailOfFile(name, options, record));
-  return WriteThumbnailFile(record, ThumbnailPathFor(name), options.hidden) ? Status::Ok : Status::ErrorCreatingFile;
+  return WriteThumbnailFile(record, ThumbnailPathFor(name), options.hidden)
+             ? Status::Ok
+             : Status::ErrorCreatingFile;
 }
 
 // A selected file and its result.
@@ -78,7 +81,8 @@ struct Making {
   Status status = Status::Ok;
   std::string hint = {};         // after the message of a failure
   bool wanted = false;           // it has no current thumbnail
-  std::vector<size_t> together;  // for the first file that uses a thumbnail file: all wanted files that use it, in order
+  // for the first file that uses a thumbnail file: all wanted files that use it, in order
+  std::vector<size_t> together;
 };
 
 std::vector<Making> PlanMaking(const std::vector<SelectedFile>& files, bool force) {
@@ -87,13 +91,17 @@ std::vector<Making> PlanMaking(const std::vector<SelectedFile>& files, bool forc
   for (size_t i = 0; i < files.size(); ++i) {
     makings[i].status = files[i].status;
     makings[i].hint = files[i].hint;
-    makings[i].wanted = files[i].status == Status::Ok && (force || StateOf(files[i].name) != ThumbnailState::Current);
-    if (makings[i].wanted) makings[firsts.try_emplace(ThumbnailPathFor(files[i].name), i).first->second].together.push_back(i);
+    makings[i].wanted = files[i].status == Status::Ok &&
+                        (force || StateOf(files[i].name) != ThumbnailState::Current);
+    if (makings[i].wanted)
+      makings[firsts.try_emplace(ThumbnailPathFor(files[i].name), i).first->second]
+          .together.push_back(i);
   }
   return makings;
 }
 
-void ReportMaking(const SelectedFile& file, const Making& making, ResultOutput& output, UsedFiles& used) {
+void ReportMaking(const SelectedFile& file, const Making& making, ResultOutput& output,
+                  UsedFiles& used) {
   const std::string thumbnail = ThumbnailPathFor(file.name);
   const bool made = making.wanted && making.status == Status::Ok;
   if (output.IsJson()) {
@@ -134,7 +142,9 @@ int RunMake(const ThumbsOptions& options, const CommandContext& context) {
               const std::string& name = (*files)[i].name;
               making.status = Guarded([&] { return MakeThumbnail(name, thumbnails); });
               if (making.status == Status::Ok) continue;
-              making.hint = making.status == Status::ErrorCreatingFile ? ReasonSentence() : OpenHint(name, making.status);
+              making.hint = making.status == Status::ErrorCreatingFile
+                                ? ReasonSentence()
+                                : OpenHint(name, making.status);
             }
             return Status::Ok;
           },
@@ -147,18 +157,24 @@ int RunMake(const ThumbsOptions& options, const CommandContext& context) {
       .goesOn = [&] { return goesOn && platform::PendingExit() == 0; },
       .tick = [&] { output.Tick(); },
   });
-  run.Run(files->size(), options.jobs == 0 ? platform::CoreCount() : static_cast<uint32_t>(options.jobs));
+  run.Run(files->size(),
+          options.jobs == 0 ? platform::CoreCount() : static_cast<uint32_t>(options.jobs));
   return output.Finish();
 }
 
 // Writes a picture; an existing file is kept unless --overwrite replace is given.
-int WriteDrawing(PictureRecord& picture, const std::string& name, const ThumbsOptions& options, ResultOutput& output) {
+int WriteDrawing(PictureRecord& picture, const std::string& name, const ThumbsOptions& options,
+                 ResultOutput& output) {
   WriteOptions write{.encode = EncodeOptionsFromSettings()};
-  write.existing = options.overwrite == "replace" ? platform::Existing::Replace : platform::Existing::Refuse;
+  write.existing =
+      options.overwrite == "replace" ? platform::Existing::Replace : platform::Existing::Refuse;
   const Status status = WritePicture(picture, options.out, write);
   if (status != Status::Ok) {
-    const bool taken = write.existing == platform::Existing::Refuse && platform::FileExists(options.out);
-    output.Failure(options.out, status, taken ? Tr("The file exists; use --overwrite replace to replace it.") : ReasonSentence());
+    const bool taken =
+        write.existing == platform::Existing::Refuse && platform::FileExists(options.out);
+    output.Failure(
+        options.out, status,
+        taken ? Tr("The file exists; use --overwrite replace to replace it.") : ReasonSentence());
     return output.Finish();
   }
   output.CountFile();
@@ -175,10 +191,12 @@ int RunShow(const ThumbsOptions& options, const CommandContext& context) {
   };
   if (!platform::IsRegularFile(name)) return fail(name, Status::FileOpenError, {});
   ThumbnailRecord record;
-  if (!ReadThumbnailFile(record, name)) return fail(name, Status::DamagedFile, Tr("Not a thumbnail file."));
+  if (!ReadThumbnailFile(record, name))
+    return fail(name, Status::DamagedFile, Tr("Not a thumbnail file."));
   const PicturePointer picture = NewPictureRecord(ReadOptionsFromSettings().alphaBackground);
   if (picture == nullptr) return fail(name, Status::MemoryAllocationError, {});
-  if (const Status status = ThumbnailRecordToBitmap(record, picture->image); status != Status::Ok) return fail(name, status, {});
+  if (const Status status = ThumbnailRecordToBitmap(record, picture->image); status != Status::Ok)
+    return fail(name, status, {});
   picture->width = picture->image.Width();
   picture->height = picture->image.Height();
   picture->bitsPerPixel = picture->image.Bits();
@@ -212,14 +230,16 @@ std::optional<std::vector<std::string>> PicturesIn(const std::string& folder) {
   if (!entries) return std::nullopt;
   std::vector<std::string> pictures;
   for (const platform::FolderEntry& entry : *entries) {
-    const bool picture = entry.kind == platform::FileKind::Regular && FindFormatByName(entry.name) != kNoFormat;
+    const bool picture =
+        entry.kind == platform::FileKind::Regular && FindFormatByName(entry.name) != kNoFormat;
     if (picture) pictures.push_back(platform::JoinFolder(folder, entry.name));
   }
   return pictures;
 }
 
 int FailFolder(ResultOutput& output, const std::string& folder) {
-  output.Failure(folder, Status::FileOpenError, platform::FileExists(folder) ? WithReason(Tr("Not a readable folder.")) : "");
+  output.Failure(folder, Status::FileOpenError,
+                 platform::FileExists(folder) ? WithReason(Tr("Not a readable folder.")) : "");
   return output.Finish();
 }
 
@@ -230,7 +250,8 @@ int RunList(const ThumbsOptions& options, const CommandContext& context) {
   const auto orphans = pictures ? OrphanThumbnails(folder, *pictures) : std::nullopt;
   if (!orphans) return FailFolder(output, folder);
   const auto print = [&](const std::string& file, const std::string& thumbnail, const char* state) {
-    if (!output.IsJson()) return output.Line(std::string(state) + "\t" + output.Shown(file.empty() ? thumbnail : file));
+    if (!output.IsJson())
+      return output.Line(std::string(state) + "\t" + output.Shown(file.empty() ? thumbnail : file));
     Json element;
     PutName(element, "file", file);
     PutName(element, "thumbnail", thumbnail);
@@ -255,7 +276,8 @@ int RunClean(const ThumbsOptions& options, const CommandContext& context) {
   for (const std::string& orphan : *orphans) {
     if (!output.GoesOn()) break;
     if (!options.dryRun && (optical || !platform::DeleteFile(orphan))) {
-      if (platform::ExistenceOf(orphan) == platform::Existence::No) continue;  // another run was faster
+      // another run was faster
+      if (platform::ExistenceOf(orphan) == platform::Existence::No) continue;
       output.Failure(orphan, Status::ErrorWritingFile, WithReason(Tr("It could not be deleted.")));
       continue;
     }
@@ -267,7 +289,8 @@ int RunClean(const ThumbsOptions& options, const CommandContext& context) {
 
 using Run = int (*)(const ThumbsOptions& options, const CommandContext& context);
 
-std::shared_ptr<ThumbsOptions> SetUp(CLI::App& app, CommandContext& context, Run run, const char* notes, const char* example) {
+std::shared_ptr<ThumbsOptions> SetUp(CLI::App& app, CommandContext& context, Run run,
+                                     const char* notes, const char* example) {
   auto options = std::make_shared<ThumbsOptions>();
   SetFooter(app, notes, example);
   context.run = [options, &context, run] { return run(*options, context); };
@@ -277,48 +300,59 @@ std::shared_ptr<ThumbsOptions> SetUp(CLI::App& app, CommandContext& context, Run
 }  // namespace
 
 void SetUpThumbsMake(CLI::App& app, CommandContext& context) {
-  const auto options = SetUp(app, context, RunMake,
-                             TrLater("Pictures with a current thumbnail file are skipped. Pictures whose names differ only in the\n"
-                                     "extension share a thumbnail file; the last one written wins."),
-                             "fotomill thumbs make holiday --recursive");
+  const auto options =
+      SetUp(app, context, RunMake,
+            TrLater("Pictures with a current thumbnail file are skipped. Pictures whose names "
+                    "differ only in the\n"
+                    "extension share a thumbnail file; the last one written wins."),
+            "fotomill thumbs make holiday --recursive");
   AddSelection(app, options->selection, context);
   AddFlag(app, "--force", options->force, "Also recreate thumbnails that are current");
-  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, 256, "Number of parallel jobs (default: 0, one per core)");
+  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, 256,
+            "Number of parallel jobs (default: 0, one per core)");
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be done");
-  AddFlag(app, "--json", options->json, "Print a JSON array of {file, thumbnail, made, status, message}");
+  AddFlag(app, "--json", options->json,
+          "Print a JSON array of {file, thumbnail, made, status, message}");
 }
 
 void SetUpThumbsShow(CLI::App& app, CommandContext& context) {
-  const auto options = SetUp(app, context, RunShow, nullptr, "fotomill thumbs show holiday/beach.THN --out beach.bmp");
+  const auto options = SetUp(app, context, RunShow, nullptr,
+                             "fotomill thumbs show holiday/beach.THN --out beach.bmp");
   context.names.Declare("FILE.THN", "The thumbnail file", 1, 1);
-  Require(AddName(app, "-o,--out", options->out, "FILE", "Picture to write; its extension selects the format"));
-  AddChoice(app, "--overwrite", options->overwrite, "HOW", "If the output exists: refuse (default) or replace",
-            {"refuse", "replace"});
+  Require(AddName(app, "-o,--out", options->out, "FILE",
+                  "Picture to write; its extension selects the format"));
+  AddChoice(app, "--overwrite", options->overwrite, "HOW",
+            "If the output exists: refuse (default) or replace", {"refuse", "replace"});
 }
 
 void SetUpThumbsDraw(CLI::App& app, CommandContext& context) {
   const auto options = SetUp(app, context, RunDraw,
-                             TrLater("The picture is rotated upright by EXIF orientation. File managers can use this command as a\n"
+                             TrLater("The picture is rotated upright by EXIF orientation. File "
+                                     "managers can use this command as a\n"
                                      "thumbnailer."),
                              "fotomill thumbs draw scan.pcx --side 128 --out scan.png");
   context.names.Declare("FILE", "The picture", 1, 1);
-  Require(AddName(app, "-o,--out", options->out, "FILE", "Picture to write; its extension selects the format"));
+  Require(AddName(app, "-o,--out", options->out, "FILE",
+                  "Picture to write; its extension selects the format"));
   AddNumber(app, "--side", options->side, "N", 1, 4096, "Longest side in pixels (default: 256)");
-  AddChoice(app, "--overwrite", options->overwrite, "HOW", "If the output exists: refuse (default) or replace",
-            {"refuse", "replace"});
+  AddChoice(app, "--overwrite", options->overwrite, "HOW",
+            "If the output exists: refuse (default) or replace", {"refuse", "replace"});
 }
 
 void SetUpThumbsList(CLI::App& app, CommandContext& context) {
-  const auto options = SetUp(app, context, RunList,
-                             TrLater("A thumbnail is current, stale (older than its picture), missing, broken, or an orphan\n"
-                                     "(without a picture)."),
-                             "fotomill thumbs list holiday --json");
+  const auto options = SetUp(
+      app, context, RunList,
+      TrLater(
+          "A thumbnail is current, stale (older than its picture), missing, broken, or an orphan\n"
+          "(without a picture)."),
+      "fotomill thumbs list holiday --json");
   context.names.Declare("DIR", "A folder of pictures", 1, 1);
   AddFlag(app, "--json", options->json, "Print a JSON array of {file, thumbnail, status}");
 }
 
 void SetUpThumbsClean(CLI::App& app, CommandContext& context) {
-  const auto options = SetUp(app, context, RunClean, nullptr, "fotomill thumbs clean holiday --dry-run");
+  const auto options =
+      SetUp(app, context, RunClean, nullptr, "fotomill thumbs clean holiday --dry-run");
   context.names.Declare("DIR", "A folder of pictures", 1, 1);
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be deleted");
 }

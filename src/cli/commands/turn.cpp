@@ -45,7 +45,8 @@ constexpr NamedTurn kTurnNames[] = {{"right", Orientation::QuarterRight},
                                     {"vertical", Orientation::MirrorDown}};
 
 Orientation TurnNamed(const std::string& name) {
-  const auto* found = std::ranges::find_if(kTurnNames, [&](const NamedTurn& turn) { return name == turn.name; });
+  const auto* found =
+      std::ranges::find_if(kTurnNames, [&](const NamedTurn& turn) { return name == turn.name; });
   return found == std::end(kTurnNames) ? Orientation::Upright : found->turn;
 }
 
@@ -56,24 +57,27 @@ std::string CheckOptions(const TurnOptions& options) {
   }
   if (!options.inPlace && options.dest.empty()) return Tr("Choose --dest DIR or --in-place.");
   if (options.keepTree && options.dest.empty()) return Tr("--keep-tree needs --dest.");
-  if (!options.dest.empty() && platform::ExistenceOf(options.dest) == platform::Existence::Yes && !platform::IsFolder(options.dest)) {
+  if (!options.dest.empty() && platform::ExistenceOf(options.dest) == platform::Existence::Yes &&
+      !platform::IsFolder(options.dest)) {
     return Tr("\"%1\" is not a folder.", options.dest);
   }
   return {};
 }
 
 int RunTurnCommand(const TurnOptions& options, const CommandContext& context) {
-  if (const std::string wrong = CheckOptions(options); !wrong.empty()) return UsageError(context, wrong);
+  if (const std::string wrong = CheckOptions(options); !wrong.empty())
+    return UsageError(context, wrong);
   const auto files = SelectFiles(options.selection, context);
   if (!files) return kExitUsage;
-  TurnFunction function{.request = {.turn = Composed(TurnNamed(options.rotate), TurnNamed(options.flip)),
-                                    .seenByExif = options.byExif || settings.ExifAdjustOrientation != 0,
-                                    .trim = options.trim,
-                                    .keepTime = options.keepTimes},
-                        .inPlace = options.inPlace,
-                        .keepTree = options.keepTree,
-                        .jobs = static_cast<uint32_t>(options.jobs),
-                        .dryRun = options.dryRun};
+  TurnFunction function{
+      .request = {.turn = Composed(TurnNamed(options.rotate), TurnNamed(options.flip)),
+                  .seenByExif = options.byExif || settings.ExifAdjustOrientation != 0,
+                  .trim = options.trim,
+                  .keepTime = options.keepTimes},
+      .inPlace = options.inPlace,
+      .keepTree = options.keepTree,
+      .jobs = static_cast<uint32_t>(options.jobs),
+      .dryRun = options.dryRun};
   BatchJob job = NewBatchJob();
   job.destinationFolder = options.dest;
   job.overwrite.prompt = options.overwrite != "replace";
@@ -90,20 +94,25 @@ int RunTurnCommand(const TurnOptions& options, const CommandContext& context) {
 void SetUpTurn(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<TurnOptions>();
   AddSelection(app, options->selection, context);
-  AddChoice(app, "--rotate", options->rotate, "HOW", "Rotate by 90 degrees left or right, or by 180", {"left", "right", "180"});
-  AddChoice(app, "--flip", options->flip, "HOW", "Mirror: horizontal or vertical; applied after --rotate",
-            {"horizontal", "vertical"});
-  AddFlag(app, "--by-exif", options->byExif, "Rotate upright by EXIF orientation, before --rotate and --flip");
-  CLI::Option* dest = AddName(app, "-d,--dest", options->dest, "DIR", "Output folder, created if needed");
+  AddChoice(app, "--rotate", options->rotate, "HOW",
+            "Rotate by 90 degrees left or right, or by 180", {"left", "right", "180"});
+  AddChoice(app, "--flip", options->flip, "HOW",
+            "Mirror: horizontal or vertical; applied after --rotate", {"horizontal", "vertical"});
+  AddFlag(app, "--by-exif", options->byExif,
+          "Rotate upright by EXIF orientation, before --rotate and --flip");
+  CLI::Option* dest =
+      AddName(app, "-d,--dest", options->dest, "DIR", "Output folder, created if needed");
   Exclude(AddFlag(app, "--in-place", options->inPlace, "Replace each file"), dest);
   AddChoice(app, "--overwrite", options->overwrite, "HOW",
             "If the output exists in --dest: keep-both (default), replace or skip", {"keep-both", "replace", "skip"});
   AddFlag(app, "--trim", options->trim, "Crop JPEG edges that cannot be turned losslessly");
   AddFlag(app, "--keep-tree", options->keepTree, "Recreate the source folders in --dest");
   AddFlag(app, "--keep-times", options->keepTimes, "Keep the modification times of the sources");
-  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, INT32_MAX, "Number of parallel jobs (default: 0, one per core)");
+  AddNumber(app, "-j,--jobs", options->jobs, "N", 0, INT32_MAX,
+            "Number of parallel jobs (default: 0, one per core)");
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be done");
-  AddFlag(app, "--json", options->json, "Print a JSON array of {file, destination, status, message}");
+  AddFlag(app, "--json", options->json,
+          "Print a JSON array of {file, destination, status, message}");
   SetFooter(app,
             "JPEG pictures are turned losslessly. If the size is not a multiple of the block size (8 or 16 pixels), only the\n"
             "EXIF orientation is changed and a message says so; --trim crops the edges instead. Files of other formats are\n"

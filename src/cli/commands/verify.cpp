@@ -25,7 +25,8 @@ struct VerifyOptions {
 // Decodes every frame of an animation.
 Status VerifyFrames(const std::string& name) {
   AnimationPointer animation;
-  Status status = OpenAnimation({.fileName = name, .options = ReadOptionsFromSettings()}, animation);
+  Status status =
+      OpenAnimation({.fileName = name, .options = ReadOptionsFromSettings()}, animation);
   while (status == Status::Ok) status = animation->Next();
   return status == Status::NoImages ? Status::Ok : status;
 }
@@ -45,7 +46,8 @@ Status VerifyFile(const std::string& name, std::string& hint, std::string& note)
     if (picture->pageCount == 1) break;
     const FormatEntry& row = FormatRow(picture->formatIndex);
     if (row.animate != nullptr) return VerifyFrames(name);
-    if ((row.flags & FMT_ANIMATED) != 0) break;  // no way to frames: each request gets the same picture
+    // no way to frames: each request gets the same picture
+    if ((row.flags & FMT_ANIMATED) != 0) break;
   }
   return Status::Ok;
 }
@@ -59,7 +61,8 @@ int RunVerify(const VerifyOptions& options, const CommandContext& context) {
   for (const SelectedFile& file : *files) {
     if (!output.GoesOn()) break;
     std::string hint = file.hint, note;
-    const Status status = file.status == Status::Ok ? VerifyFile(file.name, hint, note) : file.status;
+    const Status status =
+        file.status == Status::Ok ? VerifyFile(file.name, hint, note) : file.status;
     if (output.IsJson()) {
       Json element;
       PutName(element, "file", file.name);
@@ -73,7 +76,8 @@ int RunVerify(const VerifyOptions& options, const CommandContext& context) {
     output.CountFile();
     used.Add(file.name);
     if (!output.IsJson()) output.Line(output.Shown(file.name) + ": " + Tr(StatusMessage(status)));
-    if (options.verbose && !note.empty()) output.Note(output.Shown(file.name) + ": " + output.Shown(note));
+    if (options.verbose && !note.empty())
+      output.Note(output.Shown(file.name) + ": " + output.Shown(note));
   }
   return output.Finish();
 }

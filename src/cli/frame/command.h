@@ -22,7 +22,8 @@ inline constexpr int kExitUsage = 2;   // nothing was touched
 
 // The arguments of a command line that are not options: names of files, keys and the like.
 struct NameArguments {
-  const char* placeholder = "";  // as the usage line shows them: "FILE...", "DB FILE..."; empty: the command takes none
+  // as the usage line shows them: "FILE...", "DB FILE..."; empty: the command takes none
+  const char* placeholder = "";
   const char* help = "";  // in English
   size_t least = 0;
   size_t most = 0;
@@ -30,7 +31,8 @@ struct NameArguments {
 
   // Says what a command takes: `shownAs` and `helpText` go into the help, fewer or more names than
   // the bounds are a usage error.
-  void Declare(const char* shownAs, const char* helpText, size_t fewest, size_t greatest = SIZE_MAX) {
+  void Declare(const char* shownAs, const char* helpText, size_t fewest,
+               size_t greatest = SIZE_MAX) {
     placeholder = shownAs;
     help = helpText;
     least = fewest;
@@ -52,7 +54,8 @@ struct GlobalOptions {
 
 struct Command;
 
-// What a command works with. `setUp` declares names and options and sets `run`; the frame parses, prepares and runs.
+// What a command works with. `setUp` declares names and options and sets `run`; the frame parses,
+// prepares and runs.
 struct CommandContext {
   Io io;
   GlobalOptions global;
@@ -75,23 +78,23 @@ enum class Needs : uint8_t {
   Formats,   // the same, and the format registry ready, plug-ins included
 };
 
-// One command: a line of the table in commands.cpp, which help, dispatch, completion and nearest-name hints read. The
-// name may be two words ("tdb add").
+// One command: a line of the table in commands.cpp, which help, dispatch, completion and
+// nearest-name hints read. The name may be two words ("tdb add").
 struct Command {
   const char* name;
   const char* summary;  // in English; begins with a verb, no period
   Needs needs;
-  // Declares options and help on the command's parser, its names in `context.names`, and sets `context.run`. Both
-  // arguments outlive the run. Names never go through the parser's positional options, which read brackets, braces and
-  // empty names as list syntax.
+  // Declares options and help on the command's parser, its names in `context.names`, and sets
+  // `context.run`. Both arguments outlive the run. Names never go through the parser's positional
+  // options, which read brackets, braces and empty names as list syntax.
   void (*setUp)(CLI::App& app, CommandContext& context);
 };
 
 // Parses and runs one command line; the exit status of the program. Never throws.
 int RunCommandLine(int count, const char* const* arguments, const Io& io);
 
-// Prints "fotomill COMMAND: MESSAGE" and where to find help; returns kExitUsage. For mistakes that only the command itself
-// can detect, before it touches anything.
+// Prints "fotomill COMMAND: MESSAGE" and where to find help; returns kExitUsage. For mistakes that
+// only the command itself can detect, before it touches anything.
 int UsageError(const CommandContext& context, std::string_view message);
 
 }  // namespace fotomill::cli

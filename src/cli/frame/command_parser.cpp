@@ -36,7 +36,8 @@ class HelpFormatter : public CLI::Formatter {
   }
   std::string make_option_opts(const CLI::Option* option) const override {
     if (option->get_type_size() == 0) return {};
-    return " " + (option->get_option_text().empty() ? option->get_type_name() : option->get_option_text());
+    return " " + (option->get_option_text().empty() ? option->get_type_name()
+                                                    : option->get_option_text());
   }
 
  private:
@@ -45,15 +46,20 @@ class HelpFormatter : public CLI::Formatter {
 
 void AddGlobalOptions(CLI::App& app, GlobalOptions& global) {
   app.option_defaults()->group(Tr("Options of every command"));
-  AddName(app, "--data", global.dataFolder, "DIR", "Data folder: configuration, thumbnail database, file history");
-  AddRepeatedText(app, "--set", global.settings, "KEY=VALUE", "Set a configuration key for this run; may be repeated");
+  AddName(app, "--data", global.dataFolder, "DIR",
+          "Data folder: configuration, thumbnail database, file history");
+  AddRepeatedText(app, "--set", global.settings, "KEY=VALUE",
+                  "Set a configuration key for this run; may be repeated");
   AddFlag(app, "-q,--quiet", global.quiet, "No progress bar, notes or summary");
   AddFlag(app, "--no-input", global.noInput, "Never ask questions");
   AddFlag(app, "--no-plugins", global.noPlugins, "Do not load plug-ins");
-  AddChoice(app, "--progress", global.progress, "WHEN", "Progress bar: auto (on a terminal) or never", {"auto", "never"});
-  AddChoice(app, "--color", global.color, "WHEN", "Color: auto (on a terminal, unless NO_COLOR is set), always or never",
+  AddChoice(app, "--progress", global.progress, "WHEN",
+            "Progress bar: auto (on a terminal) or never", {"auto", "never"});
+  AddChoice(app, "--color", global.color, "WHEN",
+            "Color: auto (on a terminal, unless NO_COLOR is set), always or never",
             {"auto", "always", "never"});
-  AddName(app, "--lang", global.language, "CODE", "Language of messages, such as de or en (default: from the environment)");
+  AddName(app, "--lang", global.language, "CODE",
+          "Language of messages, such as de or en (default: from the environment)");
   app.set_help_flag("-h,--help", Tr("Show this help"));
 }
 
@@ -104,23 +110,30 @@ void CommandParser::ParseArguments(std::vector<std::string> arguments) {
   TakeNames();
 }
 
-// Throws the parser's own complaints in our words, and in the user's language; returns for all others.
+// Throws the parser's own complaints in our words, and in the user's language; returns for all
+// others.
 void CommandParser::Reword(const CLI::ParseError& error) {
   const std::string text = error.what(), kind = error.get_name();
   const std::string option = text.substr(0, text.find_first_of(": "));
   const auto refuse = [&](const std::string& message) {
     throw CLI::ExtrasError(message, CLI::ExitCodes::ExtrasError);
   };
-  if (kind == "ExcludesError") refuse(Tr("%1 and %2 cannot be combined.", option, text.substr(text.rfind(' ') + 1)));
+  if (kind == "ExcludesError")
+    refuse(Tr("%1 and %2 cannot be combined.", option, text.substr(text.rfind(' ') + 1)));
   if (kind == "RequiredError") refuse(Tr("%1 is missing.", option));
   if (kind != "ArgumentMismatch") return;
   const CLI::Option* const found = get_option_no_throw(option);
   const int values = found == nullptr ? 1 : found->get_expected_min() * found->get_type_size();
-  if (values > 1) refuse(TrCount("%2 needs %1 value.", "%2 needs %1 values.", static_cast<uint64_t>(values), option));
-  refuse(text.find("received") != std::string::npos ? Tr("%1 was given twice.", option) : Tr("%1 needs a value.", option));
+  if (values > 1)
+    refuse(TrCount("%2 needs %1 value.", "%2 needs %1 values.", static_cast<uint64_t>(values),
+                   option));
+  refuse(text.find("received") != std::string::npos ? Tr("%1 was given twice.", option)
+                                                    : Tr("%1 needs a value.", option));
 }
 
-std::string CommandParser::HelpPage() const { return CLI::detail::find_and_replace(help(), "\n\n\n", "\n\n"); }
+std::string CommandParser::HelpPage() const {
+  return CLI::detail::find_and_replace(help(), "\n\n\n", "\n\n");
+}
 
 // What the parser did not recognize is a name or an unknown option.
 void CommandParser::TakeNames() {
@@ -139,7 +152,8 @@ void CommandParser::TakeNames() {
     throw CLI::ExtrasError(Tr("%1 is missing.", names.placeholder), CLI::ExitCodes::ExtrasError);
   }
   if (names.values.size() > names.most) {
-    throw CLI::ExtrasError(Tr("Unexpected argument \"%1\".", names.values[names.most]), CLI::ExitCodes::ExtrasError);
+    throw CLI::ExtrasError(Tr("Unexpected argument \"%1\".", names.values[names.most]),
+                           CLI::ExitCodes::ExtrasError);
   }
 }
 
@@ -150,7 +164,8 @@ void CommandParser::RefuseOption(const std::string& typed) const {
     for (const std::string& longName : option->get_lnames()) known.push_back("--" + longName);
   }
   const std::vector<std::string_view> names(known.begin(), known.end());
-  throw CLI::ExtrasError(Tr("Unknown option \"%1\".", name) + NearestNameHint(name, names), CLI::ExitCodes::ExtrasError);
+  throw CLI::ExtrasError(Tr("Unknown option \"%1\".", name) + NearestNameHint(name, names),
+                         CLI::ExitCodes::ExtrasError);
 }
 
 }  // namespace fotomill::cli

@@ -37,7 +37,8 @@ std::vector<CommandWords> AllCommands() {
   std::vector<CommandWords> words;
   for (const Command& command : Commands()) {
     CommandContext context;
-    words.push_back({command.name, Tr(command.summary), OptionsOf(CommandParser(&command, context))});
+    words.push_back(
+        {command.name, Tr(command.summary), OptionsOf(CommandParser(&command, context))});
   }
   return words;
 }
@@ -63,7 +64,8 @@ std::string FirstWords(const std::vector<CommandWords>& commands) {
 std::string SecondWords(const std::vector<CommandWords>& commands, const std::string& first) {
   std::vector<std::string> words;
   for (const CommandWords& command : commands) {
-    if (command.name.starts_with(first + " ")) words.push_back(command.name.substr(first.size() + 1));
+    if (command.name.starts_with(first + " "))
+      words.push_back(command.name.substr(first.size() + 1));
   }
   return Joined(words);
 }
@@ -115,7 +117,8 @@ complete -F _fotomill fotomill
 
 std::string BashScript(const std::vector<CommandWords>& commands) {
   CommandContext context;
-  std::string options = "_fotomill_options() {\n  case $1 in\n", second = "_fotomill_second() {\n  case $1 in\n";
+  std::string options = "_fotomill_options() {\n  case $1 in\n",
+              second = "_fotomill_second() {\n  case $1 in\n";
   std::set<std::string> groups;
   for (const CommandWords& command : commands) {
     options += "    '" + command.name + "') echo '" + Joined(command.options) + "' ;;\n";
@@ -124,7 +127,8 @@ std::string BashScript(const std::vector<CommandWords>& commands) {
       second += "    '" + first + "') echo '" + SecondWords(commands, first) + "' ;;\n";
     }
   }
-  options += "    *) echo '" + Joined(OptionsOf(CommandParser(nullptr, context))) + " --version -V' ;;\n  esac\n}\n";
+  options += "    *) echo '" + Joined(OptionsOf(CommandParser(nullptr, context))) +
+             " --version -V' ;;\n  esac\n}\n";
   second += "    *) ;;\n  esac\n}\n";
   std::string script = CLI::detail::find_and_replace(kBash, "@COMMANDS@", FirstWords(commands));
   script = CLI::detail::find_and_replace(script, "@EXTENSIONS@", WritableExtensions());
@@ -174,15 +178,16 @@ std::string FishScript(const std::vector<CommandWords>& commands) {
     script += "complete -c fotomill -n __fotomill_none -f -a " + first + " -d " +
               FishQuoted(blank == std::string::npos ? command.summary : first + " ...") + "\n";
     if (blank != std::string::npos) {
-      script += "complete -c fotomill -n '__fotomill_is " + first + "' -f -a " + command.name.substr(blank + 1) + " -d " +
-                FishQuoted(command.summary) + "\n";
+      script += "complete -c fotomill -n '__fotomill_is " + first + "' -f -a " +
+                command.name.substr(blank + 1) + " -d " + FishQuoted(command.summary) + "\n";
     }
     CommandContext context;
-    script += FishOptions("__fotomill_is " + command.name, CommandParser(FindCommand(command.name), context));
+    script += FishOptions("__fotomill_is " + command.name,
+                          CommandParser(FindCommand(command.name), context));
   }
   for (const char* command : {"convert", "contact-sheet"}) {
-    script += std::string("complete -c fotomill -n '__fotomill_is ") + command + "' -s t -l to -x -a " +
-              FishQuoted(WritableExtensions()) + "\n";
+    script += std::string("complete -c fotomill -n '__fotomill_is ") + command +
+              "' -s t -l to -x -a " + FishQuoted(WritableExtensions()) + "\n";
   }
   return script;
 }
@@ -194,7 +199,9 @@ int RunCompletion(const CommandContext& context) {
   if (shell == "bash") script = BashScript(commands);
   if (shell == "zsh") script = ZshScript(commands);
   if (shell == "fish") script = FishScript(commands);
-  if (script.empty()) return UsageError(context, Tr("There is no completion for \"%1\"; choose bash, zsh or fish.", shell));
+  if (script.empty())
+    return UsageError(context,
+                      Tr("There is no completion for \"%1\"; choose bash, zsh or fish.", shell));
   std::fwrite(script.data(), 1, script.size(), context.io.out);
   return kExitOk;
 }
@@ -203,7 +210,8 @@ int RunCompletion(const CommandContext& context) {
 
 void SetUpCompletion(CLI::App& app, CommandContext& context) {
   context.names.Declare("SHELL", "bash, zsh or fish", 1, 1);
-  SetFooter(app, nullptr, "fotomill completion bash > ~/.local/share/bash-completion/completions/fotomill");
+  SetFooter(app, nullptr,
+            "fotomill completion bash > ~/.local/share/bash-completion/completions/fotomill");
   context.run = [&context] { return RunCompletion(context); };
 }
 

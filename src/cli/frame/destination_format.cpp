@@ -13,8 +13,8 @@ namespace fotomill::cli {
 
 namespace {
 
-// The row with exactly this extension; the looser rules for reading would make an AVI of "x.avif". Common other spellings
-// are accepted.
+// The row with exactly this extension; the looser rules for reading would make an AVI of "x.avif".
+// Common other spellings are accepted.
 int32_t RowOfExtension(std::string_view extension) {
   constexpr std::pair<std::string_view, std::string_view> kSpellings[] = {
       {"tiff", "TIF"}, {"fits", "FIT"}, {"targa", "TGA"}, {"pict", "PCT"}};
@@ -24,10 +24,12 @@ int32_t RowOfExtension(std::string_view extension) {
   }
   for (int32_t i = 0; i < formatCount; ++i) {
     const FormatEntry& row = FormatRow(i);
-    const bool named = (row.flags & (FMT_SPARE | FMT_CLIPBOARD)) == 0 && EqualIgnoringCase(row.extension, extension);
+    const bool named = (row.flags & (FMT_SPARE | FMT_CLIPBOARD)) == 0 &&
+                       EqualIgnoringCase(row.extension, extension);
     if (named) return i;
   }
-  if (extension.empty() || extension.find_first_of("./\\") != std::string_view::npos) return kNoFormat;
+  if (extension.empty() || extension.find_first_of("./\\") != std::string_view::npos)
+    return kNoFormat;
   return FindPluginFormat("x." + std::string(extension));
 }
 
@@ -36,7 +38,8 @@ std::string UnknownFormat(const std::string& extension) {
   for (int32_t i = 0; i < formatCount; ++i) {
     if (CanWrite(FormatRow(i))) known.push_back(LowerCase(FormatRow(i).extension));
   }
-  for (const PluginFormatFacts& format : PluginFormats()) known.push_back(LowerCase(format.extension));
+  for (const PluginFormatFacts& format : PluginFormats())
+    known.push_back(LowerCase(format.extension));
   const std::vector<std::string_view> names(known.begin(), known.end());
   return Tr("Unknown format \"%1\".", extension) + NearestNameHint(extension, names);
 }
@@ -48,7 +51,8 @@ std::string ReadDestinationFormat(const std::string& extension, BatchJob& job) {
   if (job.formatIndex == kNoFormat) return UnknownFormat(extension);
   const FormatEntry& row = FormatRow(job.formatIndex);
   job.extension = row.extension.view();
-  return CanWrite(row) ? std::string() : Tr("%1 cannot be written.", job.extension) + " " + Tr(WhyNot(row));
+  return CanWrite(row) ? std::string()
+                       : Tr("%1 cannot be written.", job.extension) + " " + Tr(WhyNot(row));
 }
 
 }  // namespace fotomill::cli

@@ -59,13 +59,15 @@ class Selector {
   void AddFolder(const std::string& folder, const std::string& below, int depth) {
     const auto entries = platform::ListFolder(folder);
     if (!entries) {
-      files_.push_back({folder, below, Status::FileOpenError, WithReason(Tr("The folder cannot be read."))});
+      files_.push_back(
+          {folder, below, Status::FileOpenError, WithReason(Tr("The folder cannot be read."))});
       return;
     }
     for (const platform::FolderEntry& entry : *entries) {
       const std::string path = platform::JoinFolder(folder, entry.name);
       if (entry.kind == platform::FileKind::Folder) {
-        if (recursive_ && !entry.link) Descend(path, platform::JoinFolder(below, entry.name), depth + 1);
+        if (recursive_ && !entry.link)
+          Descend(path, platform::JoinFolder(below, entry.name), depth + 1);
       } else if (FindFormatByName(entry.name) != kNoFormat && IsFile(entry, path)) {
         files_.push_back({path, below, Status::Ok, {}});
       }
@@ -73,13 +75,15 @@ class Selector {
   }
 
   static bool IsFile(const platform::FolderEntry& entry, const std::string& path) {
-    return entry.kind == platform::FileKind::Regular || (entry.link && platform::IsRegularFile(path));
+    return entry.kind == platform::FileKind::Regular ||
+           (entry.link && platform::IsRegularFile(path));
   }
 
   // Skips a folder that is its own ancestor, which mounts can cause.
   void Descend(const std::string& folder, const std::string& below, int depth) {
     if (depth > kDeepestFolder) {
-      files_.push_back({folder, below, Status::FileOpenError, Tr("The folders are nested too deeply.")});
+      files_.push_back(
+          {folder, below, Status::FileOpenError, Tr("The folders are nested too deeply.")});
       return;
     }
     const platform::FileFacts facts = platform::FactsOf(folder);
@@ -99,11 +103,14 @@ class Selector {
 void AddSelection(CLI::App& app, SelectionOptions& options, CommandContext& context) {
   context.names.Declare("FILE...", "Picture files, or folders of pictures", 0);
   AddFlag(app, "-r,--recursive", options.recursive, "Descend into subfolders");
-  AddName(app, "--files-from", options.filesFrom, "FILE|-", "Read names from a file, one per line; - is standard input");
-  AddFlag(app, "-0,--null", options.zeroTerminated, "Names in that file are separated by NUL (find -print0)");
+  AddName(app, "--files-from", options.filesFrom, "FILE|-",
+          "Read names from a file, one per line; - is standard input");
+  AddFlag(app, "-0,--null", options.zeroTerminated,
+          "Names in that file are separated by NUL (find -print0)");
 }
 
-std::optional<std::vector<SelectedFile>> SelectFiles(const SelectionOptions& options, const CommandContext& context) {
+std::optional<std::vector<SelectedFile>> SelectFiles(const SelectionOptions& options,
+                                                     const CommandContext& context) {
   Selector selector(options.recursive);
   std::string list;
   if (options.filesFrom == "-") {
@@ -112,7 +119,8 @@ std::optional<std::vector<SelectedFile>> SelectFiles(const SelectionOptions& opt
       return std::nullopt;
     }
   } else if (!options.filesFrom.empty()) {
-    if (platform::ReadWholeFile(options.filesFrom, limits.listFileBytes, list) != platform::ReadResult::Done) {
+    if (platform::ReadWholeFile(options.filesFrom, limits.listFileBytes, list) !=
+        platform::ReadResult::Done) {
       UsageError(context, Tr("The list of names \"%1\" cannot be read.", options.filesFrom));
       return std::nullopt;
     }
@@ -121,7 +129,8 @@ std::optional<std::vector<SelectedFile>> SelectFiles(const SelectionOptions& opt
     return std::nullopt;
   }
   for (const std::string& name : context.names.values) selector.Add(name);
-  for (const std::string& name : SplitList(list, options.zeroTerminated ? '\0' : '\n')) selector.Add(name);
+  for (const std::string& name : SplitList(list, options.zeroTerminated ? '\0' : '\n'))
+    selector.Add(name);
   return selector.Take();
 }
 

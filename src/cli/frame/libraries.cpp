@@ -15,11 +15,14 @@ namespace fotomill::cli {
 namespace {
 
 #define FOTOMILL_QUOTED(text) #text
-#define FOTOMILL_QUOTED_NUMBERS(major, minor, patch) FOTOMILL_QUOTED(major) "." FOTOMILL_QUOTED(minor) "." FOTOMILL_QUOTED(patch)
+#define FOTOMILL_QUOTED_NUMBERS(major, minor, patch) \
+  FOTOMILL_QUOTED(major) "." FOTOMILL_QUOTED(minor) "." FOTOMILL_QUOTED(patch)
 #define FOTOMILL_VERSION_OF(major, minor, patch) FOTOMILL_QUOTED_NUMBERS(major, minor, patch)
 
 // 2140 stands for 2.14.
-std::string LcmsVersion() { return std::to_string(LCMS_VERSION / 1000) + "." + std::to_string(LCMS_VERSION % 1000 / 10); }
+std::string LcmsVersion() {
+  return std::to_string(LCMS_VERSION / 1000) + "." + std::to_string(LCMS_VERSION % 1000 / 10);
+}
 
 std::vector<Library> MakeLibraries() {
   std::vector<Library> libraries = {

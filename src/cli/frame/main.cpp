@@ -24,7 +24,8 @@ int main(int count, char** arguments) {
   if (io.outStored) std::setvbuf(io.out, buffer, _IOFBF, sizeof buffer);
   io.errTerminal = platform::IsTerminal(2);
   platform::onLongLockWait = [](const std::string& path, const std::string& holder) {
-    const std::string line = Tr("Waiting for \"%1\", locked by %2.", EscapeControls(path), EscapeControls(holder));
+    const std::string line =
+        Tr("Waiting for \"%1\", locked by %2.", EscapeControls(path), EscapeControls(holder));
     std::fprintf(stderr, "fotomill: %s\n", line.c_str());
   };
   return cli::RunCommandLine(count, arguments, io);

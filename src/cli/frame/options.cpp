@@ -11,17 +11,20 @@ CLI::Option* AddFlag(CLI::App& app, const char* names, bool& value, const char* 
   return app.add_flag(names, value, Tr(help));
 }
 
-CLI::Option* AddText(CLI::App& app, const char* names, std::string& value, const char* shownAs, const char* help) {
+CLI::Option* AddText(CLI::App& app, const char* names, std::string& value, const char* shownAs,
+                     const char* help) {
   return app.add_option(names, value, Tr(help))->option_text(shownAs);
 }
 
-CLI::Option* AddName(CLI::App& app, const char* names, std::string& value, const char* shownAs, const char* help) {
-  const CLI::Validator notEmpty([](const std::string& text) { return text.empty() ? Tr("is empty") : std::string(); }, "");
+CLI::Option* AddName(CLI::App& app, const char* names, std::string& value, const char* shownAs,
+                     const char* help) {
+  const CLI::Validator notEmpty(
+      [](const std::string& text) { return text.empty() ? Tr("is empty") : std::string(); }, "");
   return AddText(app, names, value, shownAs, help)->check(notEmpty);
 }
 
-CLI::Option* AddChoice(CLI::App& app, const char* names, std::string& value, const char* shownAs, const char* help,
-                       std::initializer_list<const char*> choices) {
+CLI::Option* AddChoice(CLI::App& app, const char* names, std::string& value, const char* shownAs,
+                       const char* help, std::initializer_list<const char*> choices) {
   const std::vector<std::string> words(choices.begin(), choices.end());
   const CLI::Validator isWord(
       [words](const std::string& text) {
@@ -34,26 +37,30 @@ CLI::Option* AddChoice(CLI::App& app, const char* names, std::string& value, con
   return AddText(app, names, value, shownAs, help)->check(isWord);
 }
 
-CLI::Option* AddNumber(CLI::App& app, const char* names, int32_t& value, const char* shownAs, int32_t least, int32_t most,
-                       const char* help) {
+CLI::Option* AddNumber(CLI::App& app, const char* names, int32_t& value, const char* shownAs,
+                       int32_t least, int32_t most, const char* help) {
   const CLI::Validator inRange(
       [least, most](const std::string& text) {
         const auto number = ParseNumber<int32_t>(text);
         if (number && *number >= least && *number <= most) return std::string();
-        if (most == INT32_MAX) return Tr("\"%1\" is not a whole number of at least %2", text, least);
+        if (most == INT32_MAX)
+          return Tr("\"%1\" is not a whole number of at least %2", text, least);
         return Tr("\"%1\" is not a whole number from %2 to %3", text, least, most);
       },
       "");
   return app.add_option(names, value, Tr(help))->option_text(shownAs)->check(inRange);
 }
 
-CLI::Option* AddTexts(CLI::App& app, const char* names, std::vector<std::string>& values, int count, const char* shownAs,
-                      const char* help) {
-  return app.add_option(names, values, Tr(help))->option_text(shownAs)->expected(count)->allow_extra_args(false);
+CLI::Option* AddTexts(CLI::App& app, const char* names, std::vector<std::string>& values, int count,
+                      const char* shownAs, const char* help) {
+  return app.add_option(names, values, Tr(help))
+      ->option_text(shownAs)
+      ->expected(count)
+      ->allow_extra_args(false);
 }
 
-CLI::Option* AddRepeatedText(CLI::App& app, const char* names, std::vector<std::string>& values, const char* shownAs,
-                             const char* help) {
+CLI::Option* AddRepeatedText(CLI::App& app, const char* names, std::vector<std::string>& values,
+                             const char* shownAs, const char* help) {
   return app.add_option(names, values, Tr(help))->option_text(shownAs)->allow_extra_args(false);
 }
 
@@ -62,7 +69,8 @@ void Require(CLI::Option* option) { option->required(); }
 void Exclude(CLI::Option* option, CLI::Option* other) { option->excludes(other); }
 
 void SetFooter(CLI::App& app, const char* notes, const char* example) {
-  app.footer((notes == nullptr ? "" : std::string(Tr(notes)) + "\n\n") + Tr("Example: %1", example));
+  app.footer((notes == nullptr ? "" : std::string(Tr(notes)) + "\n\n") +
+             Tr("Example: %1", example));
 }
 
 }  // namespace fotomill::cli

@@ -6,8 +6,9 @@
 
 namespace fotomill::cli {
 
-// Prepares what a command needs: the data folder of --data, the configuration, the values of --set, the formats' startup.
-// Returns what is wrong with the command line, a whole sentence; empty if nothing is.
+// Prepares what a command needs: the data folder of --data, the configuration, the values of --set,
+// the formats' startup. Returns what is wrong with the command line, a whole sentence; empty if
+// nothing is.
 std::string PrepareFor(const Command& command, const GlobalOptions& global);
 // The formats' shutdown, after the command.
 void FinishAfter(const Command& command);

@@ -6,7 +6,8 @@
 
 namespace fotomill::cli {
 
-bool ReadRecipeOptions(const RecipeOptions& options, const CommandContext& context, std::shared_ptr<const Recipe>& recipe) {
+bool ReadRecipeOptions(const RecipeOptions& options, const CommandContext& context,
+                       std::shared_ptr<const Recipe>& recipe) {
   const bool given = !options.steps.empty() || !options.recipe.empty();
   if (!given && !options.needed) return true;
   std::string text = options.steps, path, wrong;
@@ -15,7 +16,8 @@ bool ReadRecipeOptions(const RecipeOptions& options, const CommandContext& conte
   auto read = std::make_shared<Recipe>();
   if (wrong.empty()) {
     const bool lines = text.find('\n') != std::string::npos;
-    for (const Mistake& mistake : ReadRecipe(text, KeyTextInForce, *read)) wrong += (wrong.empty() ? "" : "\n") + mistake.Text(lines);
+    for (const Mistake& mistake : ReadRecipe(text, KeyTextInForce, *read))
+      wrong += (wrong.empty() ? "" : "\n") + mistake.Text(lines);
   }
   if (!wrong.empty()) {
     UsageError(context, wrong);

@@ -16,7 +16,9 @@ struct RecipeOptions {
   bool needed;                // one of them must be given
 };
 
-// Reads the recipe of a command line; null where none is given and none is needed. False after a message: a usage error.
-bool ReadRecipeOptions(const RecipeOptions& options, const CommandContext& context, std::shared_ptr<const Recipe>& recipe);
+// Reads the recipe of a command line; null where none is given and none is needed. False after a
+// message: a usage error.
+bool ReadRecipeOptions(const RecipeOptions& options, const CommandContext& context,
+                       std::shared_ptr<const Recipe>& recipe);
 
 }  // namespace fotomill::cli

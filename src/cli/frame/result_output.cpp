@@ -12,9 +12,12 @@ namespace {
 
 constexpr std::string_view kRed = "\x1b[31m", kPlain = "\x1b[0m";
 
-void Write(std::FILE* stream, std::string_view text) { std::fwrite(text.data(), 1, text.size(), stream); }
+void Write(std::FILE* stream, std::string_view text) {
+  std::fwrite(text.data(), 1, text.size(), stream);
+}
 
-// JSON text that also escapes the control characters beyond ASCII, which JSON permits: it may go to a terminal.
+// JSON text that also escapes the control characters beyond ASCII, which JSON permits: it may go to
+// a terminal.
 std::string SafeJson(const Json& value) {
   const std::string text = value.dump(-1, ' ', false, Json::error_handler_t::replace);
   if (text.find('\x7F') == std::string::npos && text.find('\xC2') == std::string::npos) return text;
@@ -117,7 +120,9 @@ void ResultOutput::Note(std::string_view text) {
   if (!context_.global.quiet) Message(text);
 }
 
-bool ResultOutput::GoesOn() const { return std::ferror(context_.io.out) == 0 && platform::PendingExit() == 0; }
+bool ResultOutput::GoesOn() const {
+  return std::ferror(context_.io.out) == 0 && platform::PendingExit() == 0;
+}
 
 int ResultOutput::Finish() {
   progress_.Clear();
@@ -151,7 +156,8 @@ void ResultOutput::ClearForResult() {
   if (context_.io.outTerminal) progress_.Clear();
 }
 
-// Flushes results. If they go to a file, at most ten times a second: thousands of small writes cost more than some commands.
+// Flushes results. If they go to a file, at most ten times a second: thousands of small writes cost
+// more than some commands.
 void ResultOutput::Deliver(bool now) {
   constexpr std::chrono::milliseconds kLongestWait{100};
   if (context_.io.outStored && !now) {

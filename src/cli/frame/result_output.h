@@ -15,14 +15,15 @@ namespace fotomill::cli {
 // Members keep the order in which they were set.
 using Json = nlohmann::ordered_json;
 
-// Sets `key` to a name. If it is not UTF-8, also sets `key` + "Bytes" to its bytes in base64; `key` then has U+FFFD in place
-// of invalid bytes.
+// Sets `key` to a name. If it is not UTF-8, also sets `key` + "Bytes" to its bytes in base64; `key`
+// then has U+FFFD in place of invalid bytes.
 void PutName(Json& object, const std::string& key, std::string_view name);
 // Sets `status` and `message`; the message is English in every language.
 void PutStatus(Json& object, Status status);
 
-// The output of one command, in order: results on standard output, as lines or as one JSON array with one element per line,
-// and messages on standard error. Only results that go to a file are buffered, for a tenth of a second.
+// The output of one command, in order: results on standard output, as lines or as one JSON array
+// with one element per line, and messages on standard error. Only results that go to a file are
+// buffered, for a tenth of a second.
 class ResultOutput {
  public:
   // `json`: results are one JSON document instead of lines.
@@ -44,7 +45,8 @@ class ResultOutput {
   void Element(const Json& element);
   // Counts a processed file, for the closing line.
   void CountFile();
-  // Prints the message of a failed file, "NAME: MESSAGE", followed by the hint if any, and counts it.
+  // Prints the message of a failed file, "NAME: MESSAGE", followed by the hint if any, and counts
+  // it.
   void Failure(std::string_view name, Status status, std::string_view hint = {});
   // A note on standard error, not a failure; suppressed by --quiet.
   void Note(std::string_view text);
@@ -59,11 +61,12 @@ class ResultOutput {
   // Flushes everything and clears the progress line, before a question.
   void MakeWay();
 
-  // False once standard output fails or the user has interrupted the program: loops over files end then.
+  // False once standard output fails or the user has interrupted the program: loops over files end
+  // then.
   bool GoesOn() const;
   bool Failed() const { return failures_ > 0; }  // a file failed, so the exit status is not 0
-  // Ends the array, prints the closing lines ("There were errors", "3 files were processed.") and returns the exit
-  // status.
+  // Ends the array, prints the closing lines ("There were errors", "3 files were processed.") and
+  // returns the exit status.
   int Finish();
   // Ends the array; no more results follow.
   void EndArray();

@@ -20,11 +20,14 @@ namespace {
 
 using Arguments = std::vector<std::string>;
 
-void Print(std::FILE* stream, std::string_view text) { std::fwrite(text.data(), 1, text.size(), stream); }
+void Print(std::FILE* stream, std::string_view text) {
+  std::fwrite(text.data(), 1, text.size(), stream);
+}
 
 int Complain(const Io& io, const std::string& message, const std::string& topic = {}) {
   const std::string help = "fotomill help" + (topic.empty() ? "" : " " + topic);
-  Print(io.err, "fotomill: " + (io.errTerminal ? EscapeControls(message) : message) + "\n" + Tr("Try \"%1\".", help) + "\n");
+  Print(io.err, "fotomill: " + (io.errTerminal ? EscapeControls(message) : message) + "\n" +
+                    Tr("Try \"%1\".", help) + "\n");
   return kExitUsage;
 }
 
@@ -42,7 +45,8 @@ bool IsAnyOf(const std::string& argument, std::string_view shortForm, std::strin
   return argument == shortForm || argument == longForm;
 }
 
-// What the named command is called, with its second word where it has one, and the places of those words.
+// What the named command is called, with its second word where it has one, and the places of those
+// words.
 struct CommandName {
   std::string name;
   std::vector<size_t> places;
@@ -93,18 +97,21 @@ int ParseAndRun(const Command* command, const Arguments& arguments, const Io& io
     Print(io.out, command == nullptr ? MainHelp() : parser.HelpPage());
     return kExitOk;
   } catch (const CLI::ParseError& error) {
-    return Complain(io, (command == nullptr ? "" : std::string(command->name) + ": ") + error.what(),
+    return Complain(io,
+                    (command == nullptr ? "" : std::string(command->name) + ": ") + error.what(),
                     command == nullptr ? "" : command->name);
   }
   if (command == nullptr) return Complain(io, Tr("No command given."));
   const std::string problem = PrepareFor(*command, context.global);
-  if (!problem.empty()) return Complain(io, std::string(command->name) + ": " + problem, command->name);
+  if (!problem.empty())
+    return Complain(io, std::string(command->name) + ": " + problem, command->name);
   const int status = context.run();
   FinishAfter(*command);
   return status;
 }
 
-// The value of --lang, wherever it is: texts are needed before the command line is parsed. Empty without one.
+// The value of --lang, wherever it is: texts are needed before the command line is parsed. Empty
+// without one.
 std::string WantedLanguage(const Arguments& arguments) {
   constexpr std::string_view kOption = "--lang";
   std::string language;
@@ -152,7 +159,8 @@ int Dispatch(Arguments arguments, const Io& io) {
   const Command* command = FindCommand(named.name);
   if (command == nullptr && named.places.size() == 1 && BeginsCommandGroup(named.name)) {
     const std::string page = HelpOf(named.name);
-    const bool asked = arguments.size() > *place + 1 && IsAnyOf(arguments[*place + 1], "-h", "--help");
+    const bool asked =
+        arguments.size() > *place + 1 && IsAnyOf(arguments[*place + 1], "-h", "--help");
     Print(asked ? io.out : io.err, page);
     return asked ? kExitOk : kExitUsage;
   }

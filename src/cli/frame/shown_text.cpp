@@ -10,8 +10,10 @@ std::string Base64(std::string_view bytes) {
   for (size_t i = 0; i < bytes.size(); i += 3) {
     const size_t count = bytes.size() - i < 3 ? bytes.size() - i : 3;
     uint32_t group = 0;
-    for (size_t k = 0; k < 3; ++k) group = group << 8 | (k < count ? static_cast<uint8_t>(bytes[i + k]) : 0u);
-    for (size_t k = 0; k < 4; ++k) result += k <= count ? kAlphabet[group >> (18 - 6 * k) & 63] : '=';
+    for (size_t k = 0; k < 3; ++k)
+      group = group << 8 | (k < count ? static_cast<uint8_t>(bytes[i + k]) : 0u);
+    for (size_t k = 0; k < 4; ++k)
+      result += k <= count ? kAlphabet[group >> (18 - 6 * k) & 63] : '=';
   }
   return result;
 }

@@ -16,16 +16,20 @@ void TerminalBox::ShowLine(const ProgressLine& line, const FileOutcome* outcome)
     const std::string text = name + output_.ShownMessage(outcome->hint);
     return outcome->status == Status::Ok ? output_.Note(text) : output_.Message(text);
   }
-  if (outcome->status != Status::Ok) return output_.Failure(outcome->source, outcome->status, outcome->hint);
-  if (!output_.IsJson()) output_.Line(output_.Shown(outcome->source) + " -> " + output_.Shown(outcome->destination));
-  if (tellReplaced_ && outcome->replaced) output_.Note(name + Tr("replaced %1.", output_.ShownMessage(outcome->destination)));
+  if (outcome->status != Status::Ok)
+    return output_.Failure(outcome->source, outcome->status, outcome->hint);
+  if (!output_.IsJson())
+    output_.Line(output_.Shown(outcome->source) + " -> " + output_.Shown(outcome->destination));
+  if (tellReplaced_ && outcome->replaced)
+    output_.Note(name + Tr("replaced %1.", output_.ShownMessage(outcome->destination)));
   if (verbose_ && !outcome->note.empty()) output_.Note(name + outcome->note.shown);
 }
 
 void TerminalBox::ShowElement(const FileOutcome& outcome) {
   Json element;
   PutName(element, "file", outcome.source);
-  PutName(element, "destination", outcome.status == Status::Ok ? outcome.destination : std::string());
+  PutName(element, "destination",
+          outcome.status == Status::Ok ? outcome.destination : std::string());
   if (!outcome.output.empty()) element["output"] = outcome.output;
   PutStatus(element, outcome.status);
   if (outcome.skipped) element["skipped"] = true;
@@ -34,7 +38,8 @@ void TerminalBox::ShowElement(const FileOutcome& outcome) {
 }
 
 int FinishBatch(const BatchJob& job) {
-  if (!job.uses.empty()) (void)UpdateFileHistory(HistoryOptionsFromSettings(), job.uses);  // a history that cannot be written is no failure
+  // a history that cannot be written is no failure
+  if (!job.uses.empty()) (void)UpdateFileHistory(HistoryOptionsFromSettings(), job.uses);
   return job.errors || job.writeAborts > 0 ? kExitFailed : kExitOk;
 }
 

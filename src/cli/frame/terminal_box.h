@@ -8,7 +8,8 @@ namespace fotomill::cli {
 // The progress box of the command line: results and messages as every command prints them.
 class TerminalBox : public ProgressBox {
  public:
-  // `verbose` also prints notes that are not failures, `tellReplaced` also which files were replaced.
+  // `verbose` also prints notes that are not failures, `tellReplaced` also which files were
+  // replaced.
   TerminalBox(ResultOutput& output, bool verbose, bool tellReplaced)
       : output_(output), verbose_(verbose), tellReplaced_(tellReplaced) {}
 
@@ -29,7 +30,8 @@ class TerminalBox : public ProgressBox {
   const bool tellReplaced_;
 };
 
-// Records a batch in the file history. Returns the exit status of its command: kExitFailed if a file failed or got no name.
+// Records a batch in the file history. Returns the exit status of its command: kExitFailed if a
+// file failed or got no name.
 int FinishBatch(const BatchJob& job);
 
 }  // namespace fotomill::cli

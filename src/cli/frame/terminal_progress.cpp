@@ -19,10 +19,11 @@ std::string DurationText(double seconds) {
   const auto whole = static_cast<int64_t>(std::ceil(std::min(seconds, 360000.0)));
   char text[48];
   if (whole >= 3600) {
-    std::snprintf(text, sizeof text, "%d:%02d:%02d", static_cast<int>(whole / 3600), static_cast<int>(whole / 60 % 60),
-                  static_cast<int>(whole % 60));
+    std::snprintf(text, sizeof text, "%d:%02d:%02d", static_cast<int>(whole / 3600),
+                  static_cast<int>(whole / 60 % 60), static_cast<int>(whole % 60));
   } else {
-    std::snprintf(text, sizeof text, "%d:%02d", static_cast<int>(whole / 60), static_cast<int>(whole % 60));
+    std::snprintf(text, sizeof text, "%d:%02d", static_cast<int>(whole / 60),
+                  static_cast<int>(whole % 60));
   }
   return text;
 }
@@ -36,12 +37,15 @@ std::string ProgressText(uint64_t done, uint64_t total, double seconds, int widt
     char number[32];
     std::snprintf(number, sizeof number, rate < 10 ? ", %.1f/s" : ", %.0f/s", rate);
     text += number;
-    if (done < total) text += ", " + Tr("%1 left", DurationText(static_cast<double>(total - done) / rate));
+    if (done < total)
+      text += ", " + Tr("%1 left", DurationText(static_cast<double>(total - done) / rate));
   }
   const int room = std::min(width - static_cast<int>(text.size()) - 3, kLongestBar);
   if (room < kShortestBar) return text.substr(0, static_cast<size_t>(std::max(width, 0)));
-  const auto full = static_cast<size_t>(total == 0 ? 0 : done * static_cast<uint64_t>(room) / total);
-  return "[" + std::string(full, '#') + std::string(static_cast<size_t>(room) - full, '.') + "] " + text;
+  const auto full =
+      static_cast<size_t>(total == 0 ? 0 : done * static_cast<uint64_t>(room) / total);
+  return "[" + std::string(full, '#') + std::string(static_cast<size_t>(room) - full, '.') + "] " +
+         text;
 }
 
 void TerminalProgress::Begin(uint64_t total) {
@@ -58,7 +62,8 @@ void TerminalProgress::Tick() {
   if (!shown_ || total_ < 2) return;
   const double now = platform::MonotonicSeconds();
   if (now - begun_ < kFirstShown || (!hidden_ && now - drawn_ < kRedrawn)) return;
-  const std::string line = "\r" + ProgressText(done_, total_, now - begun_, platform::TerminalWidth() - 1) + "\x1b[K";
+  const std::string line =
+      "\r" + ProgressText(done_, total_, now - begun_, platform::TerminalWidth() - 1) + "\x1b[K";
   std::fwrite(line.data(), 1, line.size(), terminal_);
   std::fflush(terminal_);
   drawn_ = now;

@@ -6,8 +6,8 @@
 
 namespace fotomill::cli {
 
-// The progress line at the bottom of a terminal: a bar, the count, the rate and the time left. It appears after half a
-// second and is redrawn ten times a second.
+// The progress line at the bottom of a terminal: a bar, the count, the rate and the time left. It
+// appears after half a second and is redrawn ten times a second.
 class TerminalProgress {
  public:
   // `shown` false: nothing is ever drawn.

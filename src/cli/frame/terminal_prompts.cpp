@@ -88,14 +88,16 @@ std::optional<std::string> TerminalPrompts::Ask(const std::string& question) {
 
 std::optional<std::string> TerminalPrompts::AskDestinationName(const NameQuestion& question) {
   const std::string problem = question.problem.empty() ? "" : question.problem + " ";
-  const auto line = Ask(problem + Tr("Name of the output (empty: %1; Ctrl-D: skip):", EscapeControls(question.path)));
+  const auto line = Ask(
+      problem + Tr("Name of the output (empty: %1; Ctrl-D: skip):", EscapeControls(question.path)));
   return line && line->empty() ? question.path : line;
 }
 
 OverwriteAnswer TerminalPrompts::AskOverwrite(const OverwriteQuestion& question) {
   const std::string problem = question.problem.empty() ? "" : question.problem + " ";
   for (;;) {
-    const auto line = Ask(problem + Tr("%1 exists. r: replace, t: replace, old file to the trash, k: keep both, n NAME: use another "
+    const auto line = Ask(problem + Tr("%1 exists. r: replace, t: replace, old file to the trash, "
+                                       "k: keep both, n NAME: use another "
                                        "name, s: skip; capital letter: same answer for the rest.",
                                        EscapeControls(question.path)));
     if (!line) return {.ok = false, .checks = question.checks, .name = {}, .skipRest = true};
@@ -116,7 +118,8 @@ std::optional<std::string> TerminalPrompts::AskPassword(const std::string& path)
 bool TerminalPrompts::ConfirmNewFolder(const std::string& folder) {
   for (;;) {
     // Translators: "y" and "n" may be other letters, one each; name them in this question, too.
-    const auto line = Ask(Tr("Folder \"%1\" does not exist. Create it? [%2/%3]", EscapeControls(folder), Tr("y"), Tr("n")));
+    const auto line = Ask(Tr("Folder \"%1\" does not exist. Create it? [%2/%3]",
+                             EscapeControls(folder), Tr("y"), Tr("n")));
     if (!line || *line == "n" || *line == Tr("n")) return false;
     if (line->empty() || *line == "y" || *line == Tr("y")) return true;
   }

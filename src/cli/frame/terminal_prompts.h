@@ -9,12 +9,14 @@
 
 namespace fotomill::cli {
 
-// Asks on standard error and reads answers from standard input. End of input and Ctrl-C mean the answer that changes nothing.
-// Answers apply to that file or that run and are never stored as settings.
+// Asks on standard error and reads answers from standard input. End of input and Ctrl-C mean the
+// answer that changes nothing. Answers apply to that file or that run and are never stored as
+// settings.
 class TerminalPrompts : public Prompts {
  public:
   // Questions go to the terminal; context and output must outlive it.
-  TerminalPrompts(const CommandContext& context, ResultOutput& output) : context_(context), output_(output) {}
+  TerminalPrompts(const CommandContext& context, ResultOutput& output)
+      : context_(context), output_(output) {}
 
   std::optional<std::string> AskDestinationName(const NameQuestion& question) override;
   OverwriteAnswer AskOverwrite(const OverwriteQuestion& question) override;
@@ -23,7 +25,8 @@ class TerminalPrompts : public Prompts {
   bool ConfirmNewFolder(const std::string& folder) override;
 
  private:
-  // Prints a question and reads the answer, without line end and surrounding blanks; nullopt at the end of input.
+  // Prints a question and reads the answer, without line end and surrounding blanks; nullopt at the
+  // end of input.
   std::optional<std::string> Ask(const std::string& question);
 
   const CommandContext& context_;

@@ -8,7 +8,8 @@
 namespace fotomill::cli {
 
 void UsedFiles::Add(const std::string& name) {
-  if (!function_ || (settings.FileHistoryFunctions >> static_cast<int32_t>(*function_) & 1) == 0) return;
+  if (!function_ || (settings.FileHistoryFunctions >> static_cast<int32_t>(*function_) & 1) == 0)
+    return;
   const std::string_view fileName = platform::FileNameOf(name);
   const std::string folder = name.substr(0, name.size() - fileName.size());
   if (uses_.empty() || folder != folder_) {  // a batch has many files of one folder

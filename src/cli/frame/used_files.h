@@ -10,8 +10,8 @@
 
 namespace fotomill::cli {
 
-// The files a command used, collected while it runs and recorded in the file history at its end. Failing to write the
-// history is not a failure of the command.
+// The files a command used, collected while it runs and recorded in the file history at its end.
+// Failing to write the history is not a failure of the command.
 class UsedFiles {
  public:
   // Without a function nothing is recorded.

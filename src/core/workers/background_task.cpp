@@ -44,6 +44,8 @@ bool BackgroundTask::Running() const {
   return state_->running;
 }
 
-bool RunLoose(std::function<void()> work) { return WorkerPool::Shared().Run(Lane::Blocking, std::move(work)); }
+bool RunLoose(std::function<void()> work) {
+  return WorkerPool::Shared().Run(Lane::Blocking, std::move(work));
+}
 
 }  // namespace fotomill

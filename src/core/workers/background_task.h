@@ -11,7 +11,8 @@
 
 namespace fotomill {
 
-// One piece of work apart that belongs to somebody: it goes with its owner, who asks it to stop and waits for it.
+// One piece of work apart that belongs to somebody: it goes with its owner, who asks it to stop and
+// waits for it.
 class BackgroundTask {
  public:
   using Work = std::function<Status(const StopToken& stop)>;
@@ -21,8 +22,9 @@ class BackgroundTask {
   BackgroundTask(const BackgroundTask&) = delete;
   BackgroundTask& operator=(const BackgroundTask&) = delete;
 
-  // Stops and waits for what was started before, then has `work` run on a thread of the pool, and `ended` behind it with the
-  // status; MemoryAllocationError when the work ran out of memory, or no thread can be had: `ended` is called here then.
+  // Stops and waits for what was started before, then has `work` run on a thread of the pool, and
+  // `ended` behind it with the status; MemoryAllocationError when the work ran out of memory, or no
+  // thread can be had: `ended` is called here then.
   void Start(Lane lane, Work work, std::function<void(Status)> ended = {});
   void Stop();         // without waiting
   void StopAndWait();  // not on the task's own thread
@@ -39,8 +41,8 @@ class BackgroundTask {
   std::shared_ptr<State> state_;
 };
 
-// Work that nobody waits for, since it may hang: `work` has to hold, or to ask for, all that it uses. False when no thread can
-// be had.
+// Work that nobody waits for, since it may hang: `work` has to hold, or to ask for, all that it
+// uses. False when no thread can be had.
 bool RunLoose(std::function<void()> work);
 
 }  // namespace fotomill

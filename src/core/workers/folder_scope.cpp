@@ -12,7 +12,8 @@ FolderScope::FolderScope(const std::string& path) {
   thread_local bool lastIsSlow = false;
   const platform::PathParts parts = platform::SplitPath(path);
   const bool here = parts.drive.empty() && parts.folder.empty();
-  std::string folder = here ? std::string(".") : std::string(parts.drive) + std::string(parts.folder);
+  std::string folder =
+      here ? std::string(".") : std::string(parts.drive) + std::string(parts.folder);
   if (folder != lastFolder) {
     release_.emplace();
     const platform::DriveKind kind = platform::VolumeOf(folder).kind;

@@ -7,8 +7,9 @@
 
 namespace fotomill {
 
-// For its lifetime, a task works with a file: where that is on a network folder or a disc, which may hang for minutes, the task
-// keeps no core of the pool busy. Asking where it lies may hang as well, and keeps none busy either.
+// For its lifetime, a task works with a file: where that is on a network folder or a disc, which
+// may hang for minutes, the task keeps no core of the pool busy. Asking where it lies may hang as
+// well, and keeps none busy either.
 class FolderScope {
  public:
   explicit FolderScope(const std::string& path);  // where `path` lies decides

@@ -6,8 +6,9 @@
 
 namespace fotomill {
 
-// Runs a piece of work, and is the one place where an exception becomes a status: MemoryAllocationError, since a lack of memory
-// is what libraries and containers throw for. Otherwise what the work returns, Ok where it returns nothing.
+// Runs a piece of work, and is the one place where an exception becomes a status:
+// MemoryAllocationError, since a lack of memory is what libraries and containers throw for.
+// Otherwise what the work returns, Ok where it returns nothing.
 template <typename Work>
 Status Guarded(Work&& work) noexcept {
   try {

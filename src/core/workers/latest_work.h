@@ -9,16 +9,19 @@
 
 namespace fotomill {
 
-// Work of which only what is wanted now counts: there is no queue that could grow old. A thread that is free asks for the most
-// urgent piece, does it, and asks again. The owner keeps its requests under a lock of its own, and changes them as it likes.
+// Work of which only what is wanted now counts: there is no queue that could grow old. A thread
+// that is free asks for the most urgent piece, does it, and asks again. The owner keeps its
+// requests under a lock of its own, and changes them as it likes.
 class LatestWork {
  public:
   using Piece = std::function<void()>;
 
-  // `next` gives the piece of work that is wanted most, an empty one when nothing is; it is called on the pool's threads, as
-  // are the pieces, at most `atOnce` at a time.
-  LatestWork(Lane lane, unsigned atOnce, std::function<Piece()> next, WorkerPool& pool = WorkerPool::Shared());
-  // No further piece begins; waits for those that have. The owner's other members have to be there still.
+  // `next` gives the piece of work that is wanted most, an empty one when nothing is; it is called
+  // on the pool's threads, as are the pieces, at most `atOnce` at a time.
+  LatestWork(Lane lane, unsigned atOnce, std::function<Piece()> next,
+             WorkerPool& pool = WorkerPool::Shared());
+  // No further piece begins; waits for those that have. The owner's other members have to be there
+  // still.
   ~LatestWork();
   LatestWork(const LatestWork&) = delete;
   LatestWork& operator=(const LatestWork&) = delete;

@@ -14,7 +14,8 @@ namespace {
 
 constexpr size_t kMostThreads = 256;   // more only cost
 constexpr size_t kMostBlocking = 128;  // of these; so many hanging folders leave room for others
-constexpr Lane kLanes[] = {Lane::Urgent, Lane::Blocking, Lane::Compute};  // in the order in which they are looked at
+// in the order in which they are looked at
+constexpr Lane kLanes[] = {Lane::Urgent, Lane::Blocking, Lane::Compute};
 
 // The pool one of whose cores this thread keeps busy, and whether for a task of Lane::Urgent.
 thread_local WorkerPool* coreOf = nullptr;
@@ -22,7 +23,8 @@ thread_local bool coreIsUrgent = false;
 
 }  // namespace
 
-WorkerPool::WorkerPool(unsigned cores, std::function<void()> quiet) : cores_(std::max(cores, 1u)), quiet_(std::move(quiet)) {}
+WorkerPool::WorkerPool(unsigned cores, std::function<void()> quiet)
+    : cores_(std::max(cores, 1u)), quiet_(std::move(quiet)) {}
 
 WorkerPool::~WorkerPool() {
   {
@@ -43,7 +45,8 @@ WorkerPool::~WorkerPool() {
 }
 
 WorkerPool& WorkerPool::Shared() {
-  static WorkerPool* const pool = std::make_unique<WorkerPool>(platform::CoreCount(), platform::EndIdleProcesses).release();
+  static WorkerPool* const pool =
+      std::make_unique<WorkerPool>(platform::CoreCount(), platform::EndIdleProcesses).release();
   return *pool;
 }
 
@@ -80,7 +83,8 @@ void WorkerPool::WakeForCore() {
 }
 
 std::list<WorkerPool::SpareWork*>::iterator WorkerPool::FindSpare() {
-  return std::ranges::find_if(spare_, [](const SpareWork* work) { return !work->exhausted && work->running < work->most; });
+  return std::ranges::find_if(
+      spare_, [](const SpareWork* work) { return !work->exhausted && work->running < work->most; });
 }
 
 bool WorkerPool::TakeTask(Task& task) {
@@ -142,7 +146,9 @@ void WorkerPool::Work() {
       } else {
         --blocking_;
       }
-      const bool quiet = running_ == 0 && std::ranges::all_of(waiting_, [](const auto& lane) { return lane.empty(); });
+      const bool quiet = running_ == 0 && std::ranges::all_of(waiting_, [](const auto& lane) {
+                           return lane.empty();
+                         });
       if (!quiet || !quiet_) continue;
       lock.unlock();
       (void)Guarded(quiet_);

@@ -20,8 +20,8 @@ enum class Lane : uint8_t {
   Compute,   // when a core is free, in the order of arrival; counts
 };
 
-// The threads of the program. Tasks that compute never keep more cores busy than there are; what waits for something slow does so
-// without a core. Threads begin when they are needed and stay.
+// The threads of the program. Tasks that compute never keep more cores busy than there are; what
+// waits for something slow does so without a core. Threads begin when they are needed and stay.
 class WorkerPool {
  public:
   // `quiet` is called on a thread of the pool each time when nothing is left to do.
@@ -31,15 +31,16 @@ class WorkerPool {
   WorkerPool(const WorkerPool&) = delete;
   WorkerPool& operator=(const WorkerPool&) = delete;
 
-  // The pool of the program. It is never destroyed: a task that hangs on a dead network folder does not keep the program from
-  // ending. Its tasks' owners wait for theirs.
+  // The pool of the program. It is never destroyed: a task that hangs on a dead network folder does
+  // not keep the program from ending. Its tasks' owners wait for theirs.
   static WorkerPool& Shared();
 
   // How many tasks and helpers the pool lets compute at a time, at least 1.
   unsigned Cores() const { return cores_; }
 
-  // Has a task run on a thread of the pool. An exception that leaves it is dropped: who wants to know wraps its work in Guarded.
-  // False when no thread can be had at all; the task is forgotten then.
+  // Has a task run on a thread of the pool. An exception that leaves it is dropped: who wants to
+  // know wraps its work in Guarded. False when no thread can be had at all; the task is forgotten
+  // then.
   [[nodiscard]] bool Run(Lane lane, std::function<void()> task);
 
  private:
@@ -87,11 +88,13 @@ class WorkerPool {
   bool ending_ = false;
 };
 
-// Lets threads of the pool that have a core and nothing else to do help with work in small steps, while the calling thread does
-// the same by itself. They begin and leave at any time: where the pool is busy with tasks, nobody comes.
+// Lets threads of the pool that have a core and nothing else to do help with work in small steps,
+// while the calling thread does the same by itself. They begin and leave at any time: where the
+// pool is busy with tasks, nobody comes.
 class Helpers {
  public:
-  // `step` does a piece of the work, on up to `most` threads at once; false if there is none left to begin.
+  // `step` does a piece of the work, on up to `most` threads at once; false if there is none left
+  // to begin.
   Helpers(WorkerPool& pool, unsigned most, std::function<bool()> step);
   // No further step begins; waits for those that have.
   ~Helpers();
@@ -104,8 +107,9 @@ class Helpers {
   bool ownCore_ = false;  // the calling thread is no task of the pool, but computes as well
 };
 
-// For its lifetime, the task that makes it waits for something slow: its core is another one's. At the end it waits for a
-// core, before any task that has not begun; one of Lane::Urgent does not wait.
+// For its lifetime, the task that makes it waits for something slow: its core is another one's. At
+// the end it waits for a core, before any task that has not begun; one of Lane::Urgent does not
+// wait.
 class CoreRelease {
  public:
   CoreRelease();  // hands the thread's core to others while it waits

@@ -1,25 +1,31 @@
-// Amiga interchange files (IFF) with an interleaved bitmap (ILBM) or a packed one (PBM), big-endian.
+// Amiga interchange files (IFF) with an interleaved bitmap (ILBM) or a packed one (PBM),
+// big-endian.
 //
-//   "FORM", bytes of what follows (4), "ILBM" or "PBM ", then chunks: name (4), bytes (4), data padded to an even length
+//   "FORM", bytes of what follows (4), "ILBM" or "PBM ", then chunks: name (4), bytes (4), data
+//   padded to an even length
 //
-//   BMHD  width, height (2 each), origin (4), planes, masking (0 none, 1 a plane of its own, 2 transparent color, 3 lasso),
-//         compression (0 none, 1 ByteRun1), nothing, transparent color (2), pixel aspect x and y, size of the page (4)
+//   BMHD  width, height (2 each), origin (4), planes, masking (0 none, 1 a plane of its own, 2
+//   transparent color, 3 lasso),
+//         compression (0 none, 1 ByteRun1), nothing, transparent color (2), pixel aspect x and y,
+//         size of the page (4)
 //   CMAP  colors: red, green, blue
 //   CAMG  screen mode (4): 0x800 hold and modify (HAM), 0x80 extra half-bright (EHB)
 //   GRAB  a brush's handle: x, y (2 each)
 //   DPI   resolution: x, y (2 each)
 //   ANNO, AUTH, NAME, "(c) "  texts
-//   BODY  ILBM: the planes of each row, ceil(width / 16) x 2 bytes each, and the mask's; PBM: bytes of even rows
+//   BODY  ILBM: the planes of each row, ceil(width / 16) x 2 bytes each, and the mask's; PBM: bytes
+//   of even rows
 //
-// Up to 8 planes are indices; 24 and 32 are the bits of red, green, blue (alpha), lowest first. HAM of 6 planes modifies 4
-// bits, HAM of 8 planes 6 bits, which are repeated to fill a byte. EHB has 32 colors and their halves. Mask and transparent
-// color become alpha. Colors of 4 bits, which old programs stored in the high half of a byte, are spread over it. Six planes
-// without a screen mode are HAM with up to 16 colors, EHB with up to 32.
+// Up to 8 planes are indices; 24 and 32 are the bits of red, green, blue (alpha), lowest first. HAM
+// of 6 planes modifies 4 bits, HAM of 8 planes 6 bits, which are repeated to fill a byte. EHB has
+// 32 colors and their halves. Mask and transparent color become alpha. Colors of 4 bits, which old
+// programs stored in the high half of a byte, are spread over it. Six planes without a screen mode
+// are HAM with up to 16 colors, EHB with up to 32.
 //
-// The writer makes ILBM of 1, 4, 8 or 24 planes, PBM of palette pictures with CreateIffPBM, in ByteRun1 unless
-// CreateIffCompressed is off.
-// Source: J. Morrison, "EA IFF 85: Standard for Interchange Format Files" and "ILBM: IFF Interleaved Bitmap" (Electronic
-// Arts, 1985, 1986); "Amiga ROM Kernel Reference Manual: Devices", 3rd edition (1991).
+// The writer makes ILBM of 1, 4, 8 or 24 planes, PBM of palette pictures with CreateIffPBM, in
+// ByteRun1 unless CreateIffCompressed is off. Source: J. Morrison, "EA IFF 85: Standard for
+// Interchange Format Files" and "ILBM: IFF Interleaved Bitmap" (Electronic Arts, 1985, 1986);
+// "Amiga ROM Kernel Reference Manual: Devices", 3rd edition (1991).
 #include "formats/amiga/iff.h"
 
 #include <algorithm>
@@ -63,7 +69,10 @@ struct IffFile {
     return hasMode ? (mode & kHalfBriteMode) != 0 : colors.size() <= size_t{3} * 32;
   }
   bool Deep() const { return planes > 8; }
-  bool Alpha() const { return masking == kMaskPlane || planes == 32 || (masking == kTransparentColor && !Deep() && !Ham()); }
+  bool Alpha() const {
+    return masking == kMaskPlane || planes == 32 ||
+           (masking == kTransparentColor && !Deep() && !Ham());
+  }
   int32_t BitsPerPixel() const { return Deep() || Ham() ? 24 : planes; }
 
   size_t PlaneSize() const {
@@ -71,7 +80,9 @@ struct IffFile {
     return packed ? (pixels + 1) / 2 * 2 : (pixels + 15) / 16 * 2;
   }
   // Planes that a row is stored in, the bytes of a packed row counting as one.
-  size_t StoredPlanes() const { return (packed ? 1 : static_cast<size_t>(planes)) + (masking == kMaskPlane ? 1 : 0); }
+  size_t StoredPlanes() const {
+    return (packed ? 1 : static_cast<size_t>(planes)) + (masking == kMaskPlane ? 1 : 0);
+  }
 };
 
 void TakeHeader(ByteReader& bytes, IffFile& file) {
@@ -105,7 +116,8 @@ void TakeChunk(std::string_view name, std::span<const uint8_t> data, IffFile& fi
     file.dpiY = bytes.Be16();
   } else if (name == "PCHG" || name == "SHAM" || name == "CTBL") {
     file.changesColors = true;
-  } else if (name == "ANNO" || ((name == "NAME" || name == "AUTH" || name == "(c) ") && file.text.empty())) {
+  } else if (name == "ANNO" ||
+             ((name == "NAME" || name == "AUTH" || name == "(c) ") && file.text.empty())) {
     file.text = data;
   }
 }
@@ -116,7 +128,8 @@ Status CheckFacts(const IffFile& file) {
   if (file.width < 1 || file.height < 1) return Status::DamagedFile;
   if (file.compression > 1) return Status::UnsupportedFormat;
   if (file.packed) return file.planes == 8 ? Status::Ok : Status::UnsupportedFormat;
-  const bool known = (file.planes >= 1 && file.planes <= 8) || file.planes == 24 || file.planes == 32;
+  const bool known =
+      (file.planes >= 1 && file.planes <= 8) || file.planes == 24 || file.planes == 32;
   return known ? Status::Ok : Status::UnsupportedFormat;
 }
 
@@ -125,7 +138,8 @@ Status ParseFile(std::span<const uint8_t> data, IffFile& file) {
   if (!bytes.Match("FORM")) return data.size() < 4 ? Status::FileReadError : Status::DamagedFile;
   bytes.Skip(4);
   file.packed = bytes.Match("PBM ");
-  if (!file.packed && !bytes.Match("ILBM")) return data.size() < 12 ? Status::FileReadError : Status::UnsupportedFormat;
+  if (!file.packed && !bytes.Match("ILBM"))
+    return data.size() < 12 ? Status::FileReadError : Status::UnsupportedFormat;
   while (bytes.Left() >= 8 && !file.hasBody) {
     const auto name = bytes.Take(4);
     const uint64_t size = bytes.Be32();
@@ -146,12 +160,15 @@ void SetPalette(const IffFile& file, Palette& palette) {
   palette = {};
   const size_t levels = file.Deep() ? 0 : (size_t{1} << file.planes) - 1;
   if (file.colors.empty() && levels > 0) {
-    for (size_t i = 0; i < 3 * (levels + 1); ++i) palette[i] = static_cast<uint8_t>(i / 3 * 255 / levels);
+    for (size_t i = 0; i < 3 * (levels + 1); ++i)
+      palette[i] = static_cast<uint8_t>(i / 3 * 255 / levels);
     return;
   }
   std::ranges::copy(file.colors, palette.begin());
-  const bool fourBits = std::ranges::all_of(palette, [](uint8_t value) { return (value & 15) == 0; });
-  for (size_t i = 0; i < palette.size() && fourBits; ++i) palette[i] = static_cast<uint8_t>(palette[i] | palette[i] >> 4);
+  const bool fourBits =
+      std::ranges::all_of(palette, [](uint8_t value) { return (value & 15) == 0; });
+  for (size_t i = 0; i < palette.size() && fourBits; ++i)
+    palette[i] = static_cast<uint8_t>(palette[i] | palette[i] >> 4);
   if (!file.HalfBrite()) return;
   for (size_t i = 0; i < size_t{3} * 32; ++i) palette[3 * 32 + i] = palette[i] / 2;
 }
@@ -169,7 +186,8 @@ void DescribePicture(const IffFile& file, PictureRecord& picture) {
   picture.height = file.height;
   picture.bitsPerPixel = file.BitsPerPixel();
   picture.imageBytes = EstimateImageBytes(picture.width, picture.height, picture.bitsPerPixel);
-  picture.alphaFlags = static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (file.Alpha() ? kHasAlpha : 0));
+  picture.alphaFlags =
+      static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (file.Alpha() ? kHasAlpha : 0));
   picture.metadata.dpiX = file.dpiX;
   picture.metadata.dpiY = file.dpiY;
   const auto textEnd = std::ranges::find(file.text, uint8_t{0});
@@ -179,7 +197,8 @@ void DescribePicture(const IffFile& file, PictureRecord& picture) {
   } else {
     SetPalette(file, picture.palette);
   }
-  if (file.changesColors) picture.warning.AssignCut("Colors that change from row to row are not shown.");
+  if (file.changesColors)
+    picture.warning.AssignCut("Colors that change from row to row are not shown.");
 }
 
 // Stores indices of one byte at the image's depth.
@@ -199,17 +218,20 @@ void PackIndices(std::span<const uint8_t> pixels, int32_t bits, std::span<uint8_
 // Makes rows of the picture out of what is stored.
 class RowMaker {
  public:
-  explicit RowMaker(const IffFile& file) : file_(file), planeSize_(file.PlaneSize()), pixels_(4 * static_cast<size_t>(file.width)) {
+  explicit RowMaker(const IffFile& file)
+      : file_(file), planeSize_(file.PlaneSize()), pixels_(4 * static_cast<size_t>(file.width)) {
     if (file.Ham()) SetPalette(file, hamColors_);
   }
 
-  void Make(std::span<const uint8_t> stored, int32_t bits, std::span<uint8_t> row, std::span<uint8_t> alpha) {
+  void Make(std::span<const uint8_t> stored, int32_t bits, std::span<uint8_t> row,
+            std::span<uint8_t> alpha) {
     const auto width = static_cast<size_t>(file_.width);
     std::span<const uint8_t> pixels = stored;
     if (!file_.packed) {
       for (int32_t first = 0; first < file_.planes; first += 8) {
         const auto plane = static_cast<size_t>(first);
-        MergeIffPlanes(&stored[plane * planeSize_], planeSize_, std::min(8, file_.planes - first), Bytes(plane / 8));
+        MergeIffPlanes(&stored[plane * planeSize_], planeSize_, std::min(8, file_.planes - first),
+                       Bytes(plane / 8));
       }
       pixels = pixels_;
     }
@@ -230,7 +252,8 @@ class RowMaker {
     return std::span(pixels_).subspan(index * width, width);
   }
 
-  void MakeAlpha(std::span<const uint8_t> stored, std::span<const uint8_t> pixels, std::span<uint8_t> alpha) {
+  void MakeAlpha(std::span<const uint8_t> stored, std::span<const uint8_t> pixels,
+                 std::span<uint8_t> alpha) {
     if (file_.masking == kMaskPlane) {
       MergeIffPlanes(&stored[(file_.StoredPlanes() - 1) * planeSize_], planeSize_, 1, alpha);
       for (uint8_t& value : alpha) value = value != 0 ? 255 : 0;
@@ -247,7 +270,8 @@ class RowMaker {
   Palette hamColors_{};
 };
 
-Status ReadRows(const IffFile& file, const PictureRecord& picture, PackedImage& image, PackedImage& alpha) {
+Status ReadRows(const IffFile& file, const PictureRecord& picture, PackedImage& image,
+                PackedImage& alpha) {
   const size_t rowSize = file.StoredPlanes() * file.PlaneSize();
   std::vector<uint8_t> unpacked(file.compression == 0 ? 0 : rowSize);
   std::span<const uint8_t> body = file.body;
@@ -261,14 +285,16 @@ Status ReadRows(const IffFile& file, const PictureRecord& picture, PackedImage& 
       row = body.first(rowSize);
       body = body.subspan(rowSize);
     }
-    const auto opacity = alpha.Empty() ? std::span<uint8_t>() : alpha.Row(y).first(static_cast<size_t>(file.width));
+    const auto opacity =
+        alpha.Empty() ? std::span<uint8_t>() : alpha.Row(y).first(static_cast<size_t>(file.width));
     maker.Make(row, image.Bits(), image.Row(y), opacity);
     RETURN_IF_BAD(picture.ReportRow(y));
   }
   return Status::Ok;
 }
 
-Status OpenPicture(platform::FileView& view, const std::string& name, IffFile& file, PictureRecord& picture) {
+Status OpenPicture(platform::FileView& view, const std::string& name, IffFile& file,
+                   PictureRecord& picture) {
   if (!view.Open(name)) return Status::FileOpenError;
   picture.fileSize = view.FileSize();
   RETURN_IF_BAD(ParseFile(view.Bytes(), file));
@@ -294,8 +320,10 @@ Status IffRead(PictureRecord& picture, const ReadRequest& request) {
   platform::FileView view;
   IffFile file;
   RETURN_IF_BAD(OpenPicture(view, request.fileName, file, picture));
-  const uint64_t least = file.StoredPlanes() * file.PlaneSize() * static_cast<uint64_t>(file.height);
-  if (file.body.size() < (file.compression == 0 ? least : least / kBestRatio)) return Status::FileReadError;
+  const uint64_t least =
+      file.StoredPlanes() * file.PlaneSize() * static_cast<uint64_t>(file.height);
+  if (file.body.size() < (file.compression == 0 ? least : least / kBestRatio))
+    return Status::FileReadError;
   PackedImage image, alpha;
   RETURN_IF_BAD(NewPackedImage(file.width, file.height, &picture.palette, picture.bitsPerPixel, image));
   if (file.Alpha()) RETURN_IF_BAD(NewAlphaPlane(file.width, file.height, alpha));
@@ -315,11 +343,14 @@ Status IffDetails(PictureRecord& picture) {
   DetailLines& lines = picture.detailLines;
   lines.AddFormat("       Planes: %d", file.planes);
   lines.AddFormat("  Compression: %s", file.compression == 0 ? "none" : "ByteRun1");
-  lines.AddFormat("         Mask: %s", file.masking < std::size(kMasks) ? kMasks[file.masking] : "unknown");
+  lines.AddFormat("         Mask: %s",
+                  file.masking < std::size(kMasks) ? kMasks[file.masking] : "unknown");
   lines.AddFormat("       Colors: %zu", file.colors.size() / 3);
   if (file.hasMode) lines.AddFormat("  Screen mode: 0x%X", file.mode);
-  if (file.aspectX > 0) lines.AddFormat(" Pixel aspect: %u:%u", unsigned{file.aspectX}, unsigned{file.aspectY});
-  if (file.handleX != 0 || file.handleY != 0) lines.AddFormat("       Handle: %d, %d", file.handleX, file.handleY);
+  if (file.aspectX > 0)
+    lines.AddFormat(" Pixel aspect: %u:%u", unsigned{file.aspectX}, unsigned{file.aspectY});
+  if (file.handleX != 0 || file.handleY != 0)
+    lines.AddFormat("       Handle: %d, %d", file.handleX, file.handleY);
   if (file.changesColors) lines.Add("       Colors change from row to row");
   return Status::Ok;
 }

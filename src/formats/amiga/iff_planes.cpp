@@ -29,15 +29,18 @@ uint64_t SpreadBits(uint8_t byte) {
 
 }  // namespace
 
-void MergeIffPlanes(const uint8_t* planes, size_t planeSize, int32_t count, std::span<uint8_t> pixels) {
+void MergeIffPlanes(const uint8_t* planes, size_t planeSize, int32_t count,
+                    std::span<uint8_t> pixels) {
   for (size_t x = 0; x < pixels.size(); x += 8) {
     uint64_t eight = 0;
-    for (int32_t p = 0; p < count; ++p) eight |= SpreadBits(planes[static_cast<size_t>(p) * planeSize + x / 8]) << p;
+    for (int32_t p = 0; p < count; ++p)
+      eight |= SpreadBits(planes[static_cast<size_t>(p) * planeSize + x / 8]) << p;
     std::memcpy(&pixels[x], &eight, std::min<size_t>(8, pixels.size() - x));
   }
 }
 
-void SplitIffPlanes(std::span<const uint8_t> pixels, size_t planeSize, int32_t count, uint8_t* planes) {
+void SplitIffPlanes(std::span<const uint8_t> pixels, size_t planeSize, int32_t count,
+                    uint8_t* planes) {
   std::memset(planes, 0, planeSize * static_cast<size_t>(count));
   for (size_t x = 0; x < pixels.size(); x += 8) {
     std::array<uint8_t, 8> eight{};
@@ -54,7 +57,8 @@ void DecodeHam(std::span<const uint8_t> pixels, int32_t bits, const uint8_t* col
   const int32_t valueBits = bits > 6 ? 6 : 4;
   const uint8_t mask = static_cast<uint8_t>((1 << valueBits) - 1);
   uint8_t color[3] = {colors[2], colors[1], colors[0]};
-  constexpr size_t kPlace[] = {0, 0, 2, 1};  // which of blue, green, red a control of 1 to 3 replaces
+  // which of blue, green, red a control of 1 to 3 replaces
+  constexpr size_t kPlace[] = {0, 0, 2, 1};
   for (const uint8_t pixel : pixels) {
     const uint8_t value = pixel & mask;
     const int32_t control = pixel >> valueBits & 3;

@@ -27,8 +27,8 @@ struct IffLayout {
   bool compressed = true;
 };
 
-// Pixels of three bytes in hold-and-modify of eight bits: each takes whichever comes nearest of a color of the palette and
-// the pixel to the left with blue, red or green replaced.
+// Pixels of three bytes in hold-and-modify of eight bits: each takes whichever comes nearest of a
+// color of the palette and the pixel to the left with blue, red or green replaced.
 class HamEncoder {
  public:
   // Fits the palette to the picture. MemoryAllocationError.
@@ -53,7 +53,9 @@ class HamEncoder {
   }
 
  private:
-  static constexpr uint8_t Spread(uint8_t value) { return static_cast<uint8_t>((value & 0xfc) | value >> 6); }
+  static constexpr uint8_t Spread(uint8_t value) {
+    return static_cast<uint8_t>((value & 0xfc) | value >> 6);
+  }
   static int32_t Square(int32_t value) { return value * value; }
 
   uint8_t EncodePixel(const uint8_t* wanted, uint8_t* color) {
@@ -72,7 +74,8 @@ class HamEncoder {
     if (best > 0) {
       const uint8_t index = nearest_->Find(wanted[0], wanted[1], wanted[2]);
       const uint8_t* entry = &palette_[3 * size_t{index}];
-      const int32_t error = Square(wanted[0] - entry[2]) + Square(wanted[1] - entry[1]) + Square(wanted[2] - entry[0]);
+      const int32_t error = Square(wanted[0] - entry[2]) + Square(wanted[1] - entry[1]) +
+                            Square(wanted[2] - entry[0]);
       if (error < best) {
         for (size_t c = 0; c < 3; ++c) color[c] = entry[2 - c];
         return index;
@@ -93,8 +96,10 @@ void WriteChunk(ByteWriter& out, std::string_view name, std::span<const uint8_t>
   out.Zeros(data.size() % 2);
 }
 
-void WriteHead(ByteWriter& out, const PictureRecord& picture, const IffLayout& layout, const Palette& palette) {
-  const auto width = static_cast<uint16_t>(picture.image.Width()), height = static_cast<uint16_t>(picture.image.Height());
+void WriteHead(ByteWriter& out, const PictureRecord& picture, const IffLayout& layout,
+               const Palette& palette) {
+  const auto width = static_cast<uint16_t>(picture.image.Width()),
+             height = static_cast<uint16_t>(picture.image.Height());
   out.Text("FORM");
   out.Be32(0);
   out.Text(layout.packed ? "PBM " : "ILBM");
@@ -112,7 +117,9 @@ void WriteHead(ByteWriter& out, const PictureRecord& picture, const IffLayout& l
   out.U8(1);
   out.Be16(width);
   out.Be16(height);
-  const size_t colors = layout.ham ? kHamColors : layout.planes == 24 ? 0 : size_t{1} << layout.planes;
+  const size_t colors = layout.ham            ? kHamColors
+                        : layout.planes == 24 ? 0
+                                              : size_t{1} << layout.planes;
   if (colors > 0) WriteChunk(out, "CMAP", std::span(palette).first(3 * colors));
   const uint8_t mode[] = {0, 0, kHamMode >> 8, 0};
   if (layout.ham) WriteChunk(out, "CAMG", mode);
@@ -122,11 +129,17 @@ void WriteHead(ByteWriter& out, const PictureRecord& picture, const IffLayout& l
 class StoredRows {
  public:
   StoredRows(const PictureRecord& picture, const IffLayout& layout, HamEncoder* ham)
-      : image_(picture.image), layout_(layout), ham_(ham), width_(static_cast<size_t>(image_.Width())), pixels_(3 * width_) {
+      : image_(picture.image),
+        layout_(layout),
+        ham_(ham),
+        width_(static_cast<size_t>(image_.Width())),
+        pixels_(3 * width_) {
     row_.resize(layout.packed ? PlaneSize() : PlaneSize() * static_cast<size_t>(layout.planes));
   }
 
-  size_t PlaneSize() const { return layout_.packed ? (width_ + 1) / 2 * 2 : (width_ + 15) / 16 * 2; }
+  size_t PlaneSize() const {
+    return layout_.packed ? (width_ + 1) / 2 * 2 : (width_ + 15) / 16 * 2;
+  }
 
   std::span<const uint8_t> Row(int32_t y) {
     const auto source = image_.Row(y);
@@ -135,14 +148,16 @@ class StoredRows {
       uint8_t* const place = pixels_.data();
       SplitColors(source.data(), width_, place + 2 * width_, place + width_, place);
       for (size_t c = 0; c < 3; ++c) {
-        SplitIffPlanes(std::span(pixels_).subspan(c * width_, width_), PlaneSize(), 8, &row_[8 * c * PlaneSize()]);
+        SplitIffPlanes(std::span(pixels_).subspan(c * width_, width_), PlaneSize(), 8,
+                       &row_[8 * c * PlaneSize()]);
       }
       return row_;
     }
     if (ham_ != nullptr) {
       ham_->EncodeRow(source, pixels);
     } else {
-      for (size_t x = 0; x < width_; ++x) pixels[x] = static_cast<uint8_t>(image_.PixelAt(static_cast<int32_t>(x), y));
+      for (size_t x = 0; x < width_; ++x)
+        pixels[x] = static_cast<uint8_t>(image_.PixelAt(static_cast<int32_t>(x), y));
     }
     if (layout_.packed) {
       std::ranges::copy(pixels, row_.begin());
@@ -160,7 +175,8 @@ class StoredRows {
   std::vector<uint8_t> pixels_, row_;
 };
 
-Status WriteBody(ByteWriter& out, const PictureRecord& picture, const IffLayout& layout, HamEncoder* ham) {
+Status WriteBody(ByteWriter& out, const PictureRecord& picture, const IffLayout& layout,
+                 HamEncoder* ham) {
   out.Text("BODY");
   const uint64_t place = out.Position();
   out.Be32(0);
@@ -188,7 +204,9 @@ Status Write(PictureRecord& picture, const WriteOptions& options, bool ham) {
   const PackedImage& image = picture.image;
   if (image.Empty()) return Status::MemoryAllocationError;
   if (image.Width() > UINT16_MAX || image.Height() > UINT16_MAX) return Status::UnsuitableImage;
-  IffLayout layout{.planes = image.Bits(), .ham = ham && image.Bits() == 24, .compressed = options.encode.iffCompressed};
+  IffLayout layout{.planes = image.Bits(),
+                   .ham = ham && image.Bits() == 24,
+                   .compressed = options.encode.iffCompressed};
   layout.packed = options.encode.iffPacked && image.Bits() <= 8;
   if (layout.packed || layout.ham) layout.planes = 8;
   HamEncoder encoder;
@@ -203,8 +221,12 @@ Status Write(PictureRecord& picture, const WriteOptions& options, bool ham) {
 
 }  // namespace
 
-Status IffWrite(PictureRecord& picture, const WriteOptions& options) { return Write(picture, options, false); }
+Status IffWrite(PictureRecord& picture, const WriteOptions& options) {
+  return Write(picture, options, false);
+}
 
-Status HamWrite(PictureRecord& picture, const WriteOptions& options) { return Write(picture, options, true); }
+Status HamWrite(PictureRecord& picture, const WriteOptions& options) {
+  return Write(picture, options, true);
+}
 
 }  // namespace fotomill

@@ -9,8 +9,10 @@ namespace {
 
 using namespace std::string_view_literals;
 
-constexpr Signature kSignatures[] = {{0, "FORM"sv, "IFF", 8, "ILBM"sv}, {0, "FORM"sv, "IFF", 8, "PBM "sv}};
-constexpr Signature kLesserSignatures[] = {{0, "FORM"sv, {}, 8, "ILBM"sv}, {0, "FORM"sv, {}, 8, "PBM "sv}};
+constexpr Signature kSignatures[] = {{0, "FORM"sv, "IFF", 8, "ILBM"sv},
+                                     {0, "FORM"sv, "IFF", 8, "PBM "sv}};
+constexpr Signature kLesserSignatures[] = {{0, "FORM"sv, {}, 8, "ILBM"sv},
+                                           {0, "FORM"sv, {}, 8, "PBM "sv}};
 
 constexpr FormatSetting kKeys[] = {
     {"CreateIffCompressed", TrLater("Amiga (IFF): compressed")},
@@ -18,7 +20,8 @@ constexpr FormatSetting kKeys[] = {
 };
 constexpr FormatSettings kSettings = {"IFF", "OverrideIffBox", TrLater("Other formats"), kKeys};
 
-constexpr FormatEntry Row(std::string_view extension, std::string_view description, uint32_t maxBits, WriteOperation write,
+constexpr FormatEntry Row(std::string_view extension, std::string_view description,
+                          uint32_t maxBits, WriteOperation write,
                           std::span<const Signature> signatures, uint32_t flags = 0) {
   return {.details = IffDetails,
           .info = IffInfo,

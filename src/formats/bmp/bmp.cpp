@@ -18,22 +18,27 @@
 //       46    8  colors used and important
 //       54       4-byte palette
 //
-// Palette entries are blue, green, red (and 0). Rows run from the bottom up, each padded to 4 bytes; pixels are indices
-// of 1, 4 or 8 bits, or blue, green, red (and alpha).
+// Palette entries are blue, green, red (and 0). Rows run from the bottom up, each padded to 4
+// bytes; pixels are indices of 1, 4 or 8 bits, or blue, green, red (and alpha).
 //
-// The reader takes compressions 1 (RLE8) and 2 (RLE4); everything else counts as uncompressed. Its peculiarities:
-// - Both dialects need 54 bytes of header. The palette always has 2^bits entries and follows the 40-byte header,
-// whatever
-//   header size and colors used say; OS/2 pixels follow the palette, whatever the pixel offset says.
-// - 16 bits with compression 3: the three masks after the header do not count in the pixel offset, so pixels start 12
-//   bytes after it. Masks of 5-6-5 give blue, green, red; all other 16-bit files are 5-5-5 and give red, green, blue.
+// The reader takes compressions 1 (RLE8) and 2 (RLE4); everything else counts as uncompressed. Its
+// peculiarities:
+// - Both dialects need 54 bytes of header. The palette always has 2^bits entries and follows the
+// 40-byte header, whatever
+//   header size and colors used say; OS/2 pixels follow the palette, whatever the pixel offset
+//   says.
+// - 16 bits with compression 3: the three masks after the header do not count in the pixel offset,
+// so pixels start 12
+//   bytes after it. Masks of 5-6-5 give blue, green, red; all other 16-bit files are 5-5-5 and give
+//   red, green, blue.
 // - A 16-bit file may end within its last row.
-// - Depths without a conversion of their own (2, 12, 64) are copied byte for byte as far as they fit a row.
+// - Depths without a conversion of their own (2, 12, 64) are copied byte for byte as far as they
+// fit a row.
 // - Run-length data must end with an end-of-bitmap code; pixels outside the picture are dropped.
 //
-// The writer stores uncompressed rows, 32-bit ones when there is an alpha plane; OS/2 files have no alpha.
-// Source: Microsoft, "BITMAPINFOHEADER structure" and "Bitmap Compression", Windows GDI reference; IBM, OS/2 2.0
-// "Presentation Manager Programming Reference", bitmap file format.
+// The writer stores uncompressed rows, 32-bit ones when there is an alpha plane; OS/2 files have no
+// alpha. Source: Microsoft, "BITMAPINFOHEADER structure" and "Bitmap Compression", Windows GDI
+// reference; IBM, OS/2 2.0 "Presentation Manager Programming Reference", bitmap file format.
 #include "formats/bmp/bmp.h"
 
 #include <algorithm>
@@ -51,12 +56,14 @@ namespace fotomill {
 
 namespace {
 
-constexpr uint64_t kHeaderSize = 54;  // both headers of the Windows dialect; OS/2 files need as many bytes
+// both headers of the Windows dialect; OS/2 files need as many bytes
+constexpr uint64_t kHeaderSize = 54;
 constexpr uint64_t kOs2HeaderSize = 26;
 constexpr uint32_t kOs2InfoSize = 12;
 constexpr uint32_t kWindowsInfoSize = 40;
 constexpr uint64_t kMasksSize = 12;
-constexpr uint64_t kChunkSize = 16 << 20;  // rows are read and written in pieces of about this many bytes
+// rows are read and written in pieces of about this many bytes
+constexpr uint64_t kChunkSize = 16 << 20;
 
 constexpr uint32_t kRle8 = 1, kRle4 = 2, kBitFields = 3;
 
@@ -75,10 +82,15 @@ struct BmpHeader {
 
   bool IsOs2() const { return infoSize == kOs2InfoSize; }
   // Whether other programs may find other colors in it: the writer's forms leave no doubt.
-  bool IsPeculiar() const { return (!IsOs2() && infoSize != kWindowsInfoSize) || bits == 16 || (bits > 8 && compression != 0); }
+  bool IsPeculiar() const {
+    return (!IsOs2() && infoSize != kWindowsInfoSize) || bits == 16 ||
+           (bits > 8 && compression != 0);
+  }
   bool TopDown() const { return height < 0; }
   // The number of rows, 0 when it is more than a height can say.
-  int32_t Rows() const { return height == std::numeric_limits<int32_t>::min() ? 0 : std::abs(height); }
+  int32_t Rows() const {
+    return height == std::numeric_limits<int32_t>::min() ? 0 : std::abs(height);
+  }
   // The depth of the picture: what the file says up to 8, else 24.
   int32_t Depth() const { return bits > 8 ? 24 : bits; }
   uint64_t FileStride() const { return RowStride(width, bits); }
@@ -86,7 +98,9 @@ struct BmpHeader {
   uint64_t PaletteEntrySize() const { return IsOs2() ? 3 : 4; }
   uint64_t PaletteSize() const { return bits > 8 ? 0 : (uint64_t{1} << bits) * PaletteEntrySize(); }
   bool HasMasks() const { return compression == kBitFields && bits == 16; }
-  uint64_t PixelOffset() const { return IsOs2() ? PaletteOffset() + PaletteSize() : pixelOffset + (HasMasks() ? kMasksSize : 0); }
+  uint64_t PixelOffset() const {
+    return IsOs2() ? PaletteOffset() + PaletteSize() : pixelOffset + (HasMasks() ? kMasksSize : 0);
+  }
 };
 
 // Ok, or DamagedFile without the signature or a whole header.
@@ -118,8 +132,8 @@ Status ParseHeader(std::span<const uint8_t> file, BmpHeader& header) {
   return signature && bytes.Ok() ? Status::Ok : Status::DamagedFile;
 }
 
-// Fills `palette` for the header's depth from the head of the file. Entries that the file does not hold stay as they
-// are in the black and white palette.
+// Fills `palette` for the header's depth from the head of the file. Entries that the file does not
+// hold stay as they are in the black and white palette.
 void ReadPalette(std::span<const uint8_t> file, const BmpHeader& header, Palette& palette) {
   MakeDefaultPalette(&palette, nullptr, header.bits > 8 ? kDisplayPalette : kBlackAndWhitePalette);
   const uint64_t begin = std::min<uint64_t>(header.PaletteOffset(), file.size());
@@ -133,8 +147,10 @@ void ReadPalette(std::span<const uint8_t> file, const BmpHeader& header, Palette
   }
 }
 
-// Fills the record's facts from the head of the file. DamagedFile when the header leaves nothing to decode.
-Status DescribePicture(const platform::FileView& file, const BmpHeader& header, PictureRecord& picture) {
+// Fills the record's facts from the head of the file. DamagedFile when the header leaves nothing to
+// decode.
+Status DescribePicture(const platform::FileView& file, const BmpHeader& header,
+                       PictureRecord& picture) {
   if (header.width < 1 || header.Rows() < 1 || header.bits < 1) return Status::DamagedFile;
   picture.typeName.AssignCut(header.IsOs2() ? "OS/2 bitmap" : "Windows bitmap");
   picture.width = header.width;
@@ -142,14 +158,17 @@ Status DescribePicture(const platform::FileView& file, const BmpHeader& header, 
   picture.bitsPerPixel = header.Depth();
   picture.simplified = header.IsPeculiar();
   picture.imageBytes = EstimateImageBytes(picture.width, picture.height, picture.bitsPerPixel);
-  picture.alphaFlags = static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (header.bits > 24 ? kHasAlpha : 0));
+  picture.alphaFlags =
+      static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (header.bits > 24 ? kHasAlpha : 0));
   ReadPalette(file.Bytes(), header, picture.palette);
   return Status::Ok;
 }
 
-// What one row becomes. `source` is a row of the file, which may be short only where the reader allows it; `row` a row
-// of the picture and `alpha` one of its alpha plane (empty without one), padding included. Writes all of `row`.
-using RowReader = void (*)(std::span<const uint8_t> source, int32_t width, std::span<uint8_t> row, std::span<uint8_t> alpha);
+// What one row becomes. `source` is a row of the file, which may be short only where the reader
+// allows it; `row` a row of the picture and `alpha` one of its alpha plane (empty without one),
+// padding included. Writes all of `row`.
+using RowReader = void (*)(std::span<const uint8_t> source, int32_t width, std::span<uint8_t> row,
+                           std::span<uint8_t> alpha);
 
 void CopyRow(std::span<const uint8_t> source, int32_t, std::span<uint8_t> row, std::span<uint8_t>) {
   const size_t count = std::min(source.size(), row.size());
@@ -159,7 +178,8 @@ void CopyRow(std::span<const uint8_t> source, int32_t, std::span<uint8_t> row, s
 
 // Calls `spread(pixel, place)` for each whole 16-bit pixel of a row.
 template <typename Spread>
-void ReadRow16(std::span<const uint8_t> source, int32_t width, std::span<uint8_t> row, Spread spread) {
+void ReadRow16(std::span<const uint8_t> source, int32_t width, std::span<uint8_t> row,
+               Spread spread) {
   const size_t count = std::min<size_t>(source.size() / 2, width);
   for (size_t x = 0; x < count; ++x) {
     spread(static_cast<uint32_t>(source[2 * x] | source[2 * x + 1] << 8), row.data() + 3 * x);
@@ -167,7 +187,8 @@ void ReadRow16(std::span<const uint8_t> source, int32_t width, std::span<uint8_t
   std::memset(row.data() + 3 * count, 0, row.size() - 3 * count);
 }
 
-void ReadRow565(std::span<const uint8_t> source, int32_t width, std::span<uint8_t> row, std::span<uint8_t>) {
+void ReadRow565(std::span<const uint8_t> source, int32_t width, std::span<uint8_t> row,
+                std::span<uint8_t>) {
   ReadRow16(source, width, row, [](uint32_t pixel, uint8_t* place) {
     place[0] = static_cast<uint8_t>((pixel & 31) * 8);
     place[1] = static_cast<uint8_t>((pixel >> 5 & 63) * 4);
@@ -175,8 +196,10 @@ void ReadRow565(std::span<const uint8_t> source, int32_t width, std::span<uint8_
   });
 }
 
-// Red comes first here, other than in all other rows: files read so since the format's first support, and stay so.
-void ReadRow555(std::span<const uint8_t> source, int32_t width, std::span<uint8_t> row, std::span<uint8_t>) {
+// Red comes first here, other than in all other rows: files read so since the format's first
+// support, and stay so.
+void ReadRow555(std::span<const uint8_t> source, int32_t width, std::span<uint8_t> row,
+                std::span<uint8_t>) {
   ReadRow16(source, width, row, [](uint32_t pixel, uint8_t* place) {
     place[0] = static_cast<uint8_t>((pixel >> 10 & 31) * 8);
     place[1] = static_cast<uint8_t>((pixel >> 5 & 31) * 8);
@@ -184,19 +207,22 @@ void ReadRow555(std::span<const uint8_t> source, int32_t width, std::span<uint8_
   });
 }
 
-void ReadRow32(std::span<const uint8_t> source, int32_t width, std::span<uint8_t> row, std::span<uint8_t>) {
+void ReadRow32(std::span<const uint8_t> source, int32_t width, std::span<uint8_t> row,
+               std::span<uint8_t>) {
   const size_t count = static_cast<size_t>(width);
   DropFourth(source.data(), count, row.data());
   std::memset(row.data() + 3 * count, 0, row.size() - 3 * count);
 }
 
-void ReadRow32Alpha(std::span<const uint8_t> source, int32_t width, std::span<uint8_t> row, std::span<uint8_t> alpha) {
+void ReadRow32Alpha(std::span<const uint8_t> source, int32_t width, std::span<uint8_t> row,
+                    std::span<uint8_t> alpha) {
   const size_t count = static_cast<size_t>(width);
   SplitAlpha(source.data(), count, row.data(), alpha.data());
   std::memset(row.data() + 3 * count, 0, row.size() - 3 * count);
 }
 
-// Whether the masks after the header are those of 5-6-5 pixels. FileReadError when the file ends within them.
+// Whether the masks after the header are those of 5-6-5 pixels. FileReadError when the file ends
+// within them.
 Status ReadMasks(std::span<const uint8_t> file, bool& is565) {
   ByteReader bytes(file);
   bytes.Seek(kHeaderSize);
@@ -205,7 +231,8 @@ Status ReadMasks(std::span<const uint8_t> file, bool& is565) {
   return bytes.Ok() ? Status::Ok : Status::FileReadError;
 }
 
-Status ChooseRowReader(const platform::FileView& file, const BmpHeader& header, const PackedImage& alpha, RowReader& reader) {
+Status ChooseRowReader(const platform::FileView& file, const BmpHeader& header,
+                       const PackedImage& alpha, RowReader& reader) {
   reader = CopyRow;
   if (header.bits == 16) {
     bool is565 = false;
@@ -221,37 +248,45 @@ Status ChooseRowReader(const platform::FileView& file, const BmpHeader& header, 
 Status CheckRowsFit(const platform::FileView& file, const BmpHeader& header) {
   const uint64_t rows = static_cast<uint64_t>(header.Rows()) - (header.bits == 16 ? 1 : 0);
   uint64_t size = 0, end = 0;
-  const bool counted = CheckedMultiply(header.FileStride(), rows, size) && CheckedAdd(size, header.PixelOffset(), end);
+  const bool counted = CheckedMultiply(header.FileStride(), rows, size) &&
+                       CheckedAdd(size, header.PixelOffset(), end);
   return counted && end <= file.FileSize() ? Status::Ok : Status::FileReadError;
 }
 
-int32_t RowsPerChunk(uint64_t stride) { return static_cast<int32_t>(std::max<uint64_t>(kChunkSize / stride, 1)); }
+int32_t RowsPerChunk(uint64_t stride) {
+  return static_cast<int32_t>(std::max<uint64_t>(kChunkSize / stride, 1));
+}
 
 // Rows that lie in the file as in the picture go straight into it.
-Status ReadRowsUnchanged(const platform::FileView& file, const BmpHeader& header, const PictureRecord& picture,
-                         PackedImage& image) {
+Status ReadRowsUnchanged(const platform::FileView& file, const BmpHeader& header,
+                         const PictureRecord& picture, PackedImage& image) {
   const int32_t height = image.Height();
   const uint64_t stride = image.Stride();
   const int32_t step = header.TopDown() ? 1 : RowsPerChunk(stride);
   for (int32_t r = 0; r < height; r += step) {
     const int32_t count = std::min(step, height - r);
     const uint64_t place = static_cast<uint64_t>(header.TopDown() ? height - 1 - r : r) * stride;
-    const std::span<uint8_t> rows = image.Rows().subspan(place, static_cast<uint64_t>(count) * stride);
-    if (!file.ReadAt(header.PixelOffset() + static_cast<uint64_t>(r) * stride, rows)) return Status::FileReadError;
+    const std::span<uint8_t> rows =
+        image.Rows().subspan(place, static_cast<uint64_t>(count) * stride);
+    if (!file.ReadAt(header.PixelOffset() + static_cast<uint64_t>(r) * stride, rows))
+      return Status::FileReadError;
     for (int32_t i = 0; i < count; ++i) RETURN_IF_BAD(picture.ReportRow(r + i));
   }
   return Status::Ok;
 }
 
-Status ReadRowsConverted(platform::FileView& file, const BmpHeader& header, const PictureRecord& picture, RowReader readRow,
-                         PackedImage& image, PackedImage& alpha) {
+Status ReadRowsConverted(platform::FileView& file, const BmpHeader& header,
+                         const PictureRecord& picture, RowReader readRow, PackedImage& image,
+                         PackedImage& alpha) {
   const int32_t height = image.Height();
   const uint64_t stride = header.FileStride();
   for (int32_t r = 0; r < height; ++r) {
     const uint64_t offset = header.PixelOffset() + static_cast<uint64_t>(r) * stride;
-    const std::span<const uint8_t> source = file.Bytes().subspan(offset, std::min(stride, file.FileSize() - offset));
+    const std::span<const uint8_t> source =
+        file.Bytes().subspan(offset, std::min(stride, file.FileSize() - offset));
     const int32_t stored = header.TopDown() ? height - 1 - r : r;
-    readRow(source, header.width, image.StoredRow(stored), alpha.Empty() ? std::span<uint8_t>() : alpha.StoredRow(stored));
+    readRow(source, header.width, image.StoredRow(stored),
+            alpha.Empty() ? std::span<uint8_t>() : alpha.StoredRow(stored));
     file.DropBefore(offset);
     RETURN_IF_BAD(picture.ReportRow(r));
   }
@@ -261,8 +296,12 @@ Status ReadRowsConverted(platform::FileView& file, const BmpHeader& header, cons
 // Pixels of 8 bits: a run repeats one index, a literal holds one index a byte.
 struct Rle8 {
   static constexpr uint64_t kPixelsPerByte = 1;
-  static void Run(uint8_t* row, uint64_t x, uint64_t count, uint8_t value) { std::memset(row + x, value, count); }
-  static void Literal(uint8_t* row, uint64_t x, uint64_t count, const uint8_t* data) { std::memcpy(row + x, data, count); }
+  static void Run(uint8_t* row, uint64_t x, uint64_t count, uint8_t value) {
+    std::memset(row + x, value, count);
+  }
+  static void Literal(uint8_t* row, uint64_t x, uint64_t count, const uint8_t* data) {
+    std::memcpy(row + x, data, count);
+  }
 };
 
 // Pixels of 4 bits: a run alternates between the high and the low half of its value.
@@ -276,27 +315,35 @@ struct Rle4 {
     for (uint64_t i = 0; i < count; ++i) Put(row, x + i, i % 2 == 0 ? value >> 4 : value & 0x0F);
   }
   static void Literal(uint8_t* row, uint64_t x, uint64_t count, const uint8_t* data) {
-    for (uint64_t i = 0; i < count; ++i) Put(row, x + i, i % 2 == 0 ? data[i / 2] >> 4 : data[i / 2] & 0x0F);
+    for (uint64_t i = 0; i < count; ++i)
+      Put(row, x + i, i % 2 == 0 ? data[i / 2] >> 4 : data[i / 2] & 0x0F);
   }
 };
 
-// Decodes run-length data into the zero-filled rows of `image`, whatever its depth, as far as they fit. Tokens:
+// Decodes run-length data into the zero-filled rows of `image`, whatever its depth, as far as they
+// fit. Tokens:
 //
 //   n v            n pixels of value v
 //   0 0            end of line           0 1          end of bitmap
-//   0 2 dx dy      move right and up     0 n data...  n pixels as they stand (n from 3), padded to an even size
+//   0 2 dx dy      move right and up     0 n data...  n pixels as they stand (n from 3), padded to
+//   an even size
 //
 // FileReadError when the data end before an end of bitmap.
 template <typename Kind>
-Status DecodeRunLength(platform::FileView& file, const BmpHeader& header, const PictureRecord& picture, PackedImage& image) {
+Status DecodeRunLength(platform::FileView& file, const BmpHeader& header,
+                       const PictureRecord& picture, PackedImage& image) {
   const int32_t height = image.Height();
   const uint64_t limit = std::min<uint64_t>(header.width, image.Stride() * Kind::kPixelsPerByte);
   ByteReader bytes(file.Bytes());
   bytes.Seek(header.PixelOffset());
   uint64_t x = 0, y = 0;
   // How many of `count` pixels at (x, y) lie in the picture, and where the row begins.
-  const auto inside = [&](uint64_t count) { return y < uint64_t(height) && x < limit ? std::min(count, limit - x) : 0; };
-  const auto row = [&] { return image.StoredRow(static_cast<int32_t>(header.TopDown() ? height - 1 - y : y)).data(); };
+  const auto inside = [&](uint64_t count) {
+    return y < uint64_t(height) && x < limit ? std::min(count, limit - x) : 0;
+  };
+  const auto row = [&] {
+    return image.StoredRow(static_cast<int32_t>(header.TopDown() ? height - 1 - y : y)).data();
+  };
   while (bytes.Left() >= 2) {
     const uint8_t count = bytes.U8(), code = bytes.U8();
     if (count > 0) {
@@ -339,16 +386,19 @@ struct BmpLayout {
 Status ChooseLayout(const PictureRecord& picture, bool os2, BmpLayout& layout) {
   const PackedImage& image = picture.image;
   layout.os2 = os2;
-  layout.alpha =
-      !layout.os2 && image.Bits() == 24 && picture.alpha.Width() == image.Width() && picture.alpha.Height() == image.Height();
+  layout.alpha = !layout.os2 && image.Bits() == 24 && picture.alpha.Width() == image.Width() &&
+                 picture.alpha.Height() == image.Height();
   layout.width = image.Width();
   layout.height = image.Height();
   layout.bits = layout.alpha ? 32 : image.Bits();
   layout.colors = static_cast<uint32_t>(image.Colors());
-  layout.pixelOffset = static_cast<uint32_t>(layout.os2 ? kOs2HeaderSize + 3 * layout.colors : kHeaderSize + 4 * layout.colors);
-  const uint64_t rowBytes = RowStride(layout.width, layout.bits) * static_cast<uint64_t>(layout.height);
+  layout.pixelOffset = static_cast<uint32_t>(layout.os2 ? kOs2HeaderSize + 3 * layout.colors
+                                                        : kHeaderSize + 4 * layout.colors);
+  const uint64_t rowBytes =
+      RowStride(layout.width, layout.bits) * static_cast<uint64_t>(layout.height);
   if (rowBytes > UINT32_MAX - layout.pixelOffset) return Status::UnsuitableImage;
-  if (layout.os2 && (layout.width > UINT16_MAX || layout.height > UINT16_MAX)) return Status::UnsuitableImage;
+  if (layout.os2 && (layout.width > UINT16_MAX || layout.height > UINT16_MAX))
+    return Status::UnsuitableImage;
   layout.rowBytes = static_cast<uint32_t>(rowBytes);
   layout.fileSize = layout.rowBytes + layout.pixelOffset;
   return Status::Ok;
@@ -394,7 +444,8 @@ Status WriteRowsUnchanged(ByteWriter& out, const PictureRecord& picture) {
   for (int32_t r = 0; r < image.Height() && !out.Failed(); r += step) {
     const int32_t count = std::min(step, image.Height() - r);
     for (int32_t i = 0; i < count; ++i) RETURN_IF_BAD(picture.ReportRow(r + i));
-    out.Bytes(image.Rows().subspan(static_cast<uint64_t>(r) * image.Stride(), static_cast<uint64_t>(count) * image.Stride()));
+    out.Bytes(image.Rows().subspan(static_cast<uint64_t>(r) * image.Stride(),
+                                   static_cast<uint64_t>(count) * image.Stride()));
   }
   return Status::Ok;
 }

@@ -17,7 +17,8 @@ constexpr Signature kSignatures[] = {
 constexpr FormatSetting kKeys[] = {{"WriteOS2Bitmaps", TrLater("Bitmaps (BMP): OS/2 version")}};
 constexpr FormatSettings kSettings = {"BMP", "OverrideBmpBox", TrLater("Other formats"), kKeys};
 
-constexpr FormatEntry Row(std::string_view extension, std::string_view description, DetailsOperation details) {
+constexpr FormatEntry Row(std::string_view extension, std::string_view description,
+                          DetailsOperation details) {
   return {.details = details,
           .info = BmpInfo,
           .read = BmpRead,

@@ -3,14 +3,14 @@
 //   2048 bytes of text: records of 128 bytes, padded with blanks, each a name, a colon and a value
 //     srcdocid, dstdocid, txtfilid, figid, srcgph, doccls   identification, written "NONE"
 //     rtype      1: one picture; 2: tiles
-//     rorient    degrees: the direction of pixels in a row, counterclockwise from the right, and that of rows from there
-//     rpelcnt    pixels in a row, and rows
-//     rdensty    pixels per inch
-//     notes      written "NONE"
+//     rorient    degrees: the direction of pixels in a row, counterclockwise from the right, and
+//     that of rows from there rpelcnt    pixels in a row, and rows rdensty    pixels per inch notes
+//     written "NONE"
 //   then the rows, coded as group 4 fax machines do; a set bit is black
 //
-// The reader takes records in any order and turns the picture upright. The writer stores the darker of two colors as black.
-// Source: MIL-STD-1840 and MIL-PRF-28002C, "Raster Graphics Representation in Binary Format" (1997); ITU-T T.6 (1988).
+// The reader takes records in any order and turns the picture upright. The writer stores the darker
+// of two colors as black. Source: MIL-STD-1840 and MIL-PRF-28002C, "Raster Graphics Representation
+// in Binary Format" (1997); ITU-T T.6 (1988).
 #include "formats/cals/cals.h"
 
 #include <algorithm>
@@ -64,9 +64,11 @@ void ReadNumbers(std::string_view text, int32_t& first, int32_t& second) {
   }
 }
 
-// Ok; FileReadError for a short header, DamagedFile where a record that counts is missing, UnsupportedFormat for tiles.
+// Ok; FileReadError for a short header, DamagedFile where a record that counts is missing,
+// UnsupportedFormat for tiles.
 Status ParseHeader(std::span<const uint8_t> file, CalsHeader& header) {
-  const std::string_view text(reinterpret_cast<const char*>(file.data()), std::min(file.size(), kHeaderSize));
+  const std::string_view text(reinterpret_cast<const char*>(file.data()),
+                              std::min(file.size(), kHeaderSize));
   int32_t pixels = 0, rows = 270, unused = 0;
   for (size_t at = 0; at + kRecordSize <= text.size(); at += kRecordSize) {
     const std::string_view record = text.substr(at, kRecordSize);
@@ -84,7 +86,8 @@ Status ParseHeader(std::span<const uint8_t> file, CalsHeader& header) {
   }
   if (text.size() < kHeaderSize) return Status::FileReadError;
   for (const Direction& direction : kDirections) {
-    if (direction.pixels == pixels && direction.rows == rows) header.orientation = direction.orientation;
+    if (direction.pixels == pixels && direction.rows == rows)
+      header.orientation = direction.orientation;
   }
   return Status::Ok;
 }
@@ -146,7 +149,8 @@ Status CalsRead(PictureRecord& picture, const ReadRequest& request) {
   RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
   DescribePicture(header, picture);
   const auto data = file.Bytes().subspan(kHeaderSize);
-  if (static_cast<uint64_t>(header.height) > 8 * data.size()) return Status::FileReadError;  // a row is one bit at least
+  // a row is one bit at least
+  if (static_cast<uint64_t>(header.height) > 8 * data.size()) return Status::FileReadError;
   PackedImage image;
   RETURN_IF_BAD(NewPackedImage(header.width, header.height, &picture.palette, 1, image));
   T6Decoder decoder(data, header.width);
@@ -171,7 +175,9 @@ Status CalsWrite(PictureRecord& picture, const WriteOptions& options) {
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
   const double dpi = picture.metadata.dpiX;
-  WriteHeader(out, picture, dpi >= 1 ? static_cast<int32_t>(std::min(dpi + 0.5, 9999.0)) : options.encode.resolution);
+  WriteHeader(
+      out, picture,
+      dpi >= 1 ? static_cast<int32_t>(std::min(dpi + 0.5, 9999.0)) : options.encode.resolution);
   T6Encoder encoder(image.Width());
   std::vector<uint8_t> row((static_cast<size_t>(image.Width()) + 7) / 8);
   const uint8_t invert = IsDarkFirst(picture.palette) ? 0xff : 0;

@@ -6,12 +6,12 @@
 
 namespace fotomill {
 
-// CALS rasters of type 1. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when data are cut short,
-// MemoryAllocationError (6), UnsupportedFormat (8) for tiled files.
+// CALS rasters of type 1. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when data
+// are cut short, MemoryAllocationError (6), UnsupportedFormat (8) for tiled files.
 Status CalsInfo(PictureRecord& picture, const ReadRequest& request);
 Status CalsRead(PictureRecord& picture, const ReadRequest& request);
-// Also UnsuitableImage (13) for sizes over 999999, ErrorCreatingFile (10), ErrorWritingFile (11), TooManyColors (12) for
-// pictures deeper than 1 bit.
+// Also UnsuitableImage (13) for sizes over 999999, ErrorCreatingFile (10), ErrorWritingFile (11),
+// TooManyColors (12) for pictures deeper than 1 bit.
 Status CalsWrite(PictureRecord& picture, const WriteOptions& options);
 
 }  // namespace fotomill

@@ -4,8 +4,9 @@
 
 namespace fotomill {
 
-// The code words of two-dimensional fax coding. Each text is a word bit by bit, as the recommendation prints it.
-// Source: ITU-T T.4 (2003), tables 2, 3a and 3b for runs; ITU-T T.6 (1988), table 1 for modes.
+// The code words of two-dimensional fax coding. Each text is a word bit by bit, as the
+// recommendation prints it. Source: ITU-T T.4 (2003), tables 2, 3a and 3b for runs; ITU-T T.6
+// (1988), table 1 for modes.
 
 // Words for runs of 0 to 63 pixels, then 64, 128, ... 1728 pixels. A longer run is made of these.
 inline constexpr int32_t kTerminatingCodes = 64, kMakeUpCodes = 27;
@@ -51,10 +52,22 @@ inline constexpr const char* kLongRunWords[] = {
     "00000001000",  "00000001100",  "00000001101",  "000000010010", "000000010011", "000000010100", "000000010101",
     "000000010110", "000000010111", "000000011100", "000000011101", "000000011110", "000000011111"};
 
-// What a mode word says of the next changing pixel a1. Vertical(d): d pixels right of b1, the change in the row above.
-enum class FaxMode : uint8_t { VerticalLeft3, VerticalLeft2, VerticalLeft1, Vertical0, VerticalRight1, VerticalRight2, VerticalRight3, Pass, Horizontal };
+// What a mode word says of the next changing pixel a1. Vertical(d): d pixels right of b1, the
+// change in the row above.
+enum class FaxMode : uint8_t {
+  VerticalLeft3,
+  VerticalLeft2,
+  VerticalLeft1,
+  Vertical0,
+  VerticalRight1,
+  VerticalRight2,
+  VerticalRight3,
+  Pass,
+  Horizontal
+};
 // Words of the two-dimensional modes.
-inline constexpr const char* kModeWords[] = {"0000010", "000010", "010", "1", "011", "000011", "0000011", "0001", "001"};
+inline constexpr const char* kModeWords[] = {"0000010", "000010",  "010",  "1",  "011",
+                                             "000011",  "0000011", "0001", "001"};
 
 // Two of these end the picture.
 inline constexpr const char* kEndOfLineWord = "000000000001";

@@ -33,14 +33,16 @@ WordTable MakeRunTable(const char* const (&words)[kTerminatingCodes + kMakeUpCod
     AddWord(table, words[kTerminatingCodes + i], static_cast<int16_t>(64 * (i + 1)));
   }
   for (size_t i = 0; i < std::size(kLongRunWords); ++i) {
-    AddWord(table, kLongRunWords[i], static_cast<int16_t>(kFirstLongRun + 64 * static_cast<int32_t>(i)));
+    AddWord(table, kLongRunWords[i],
+            static_cast<int16_t>(kFirstLongRun + 64 * static_cast<int32_t>(i)));
   }
   return table;
 }
 
 WordTable MakeModeTable() {
   WordTable table{};
-  for (size_t i = 0; i < std::size(kModeWords); ++i) AddWord(table, kModeWords[i], static_cast<int16_t>(i));
+  for (size_t i = 0; i < std::size(kModeWords); ++i)
+    AddWord(table, kModeWords[i], static_cast<int16_t>(i));
   return table;
 }
 
@@ -54,9 +56,10 @@ const WordTable& ModeTable() {
   return table;
 }
 
-// The first change in the row above that lies right of `a0` and turns to the color opposite to `black`, the color at `a0`:
-// changes with an even place turn to black. `place` begins where the search for the change before ended. The row starts
-// on an imaginary white pixel left of it, so that a change at column 0 counts while a0 is -1.
+// The first change in the row above that lies right of `a0` and turns to the color opposite to
+// `black`, the color at `a0`: changes with an even place turn to black. `place` begins where the
+// search for the change before ended. The row starts on an imaginary white pixel left of it, so
+// that a change at column 0 counts while a0 is -1.
 size_t FindB1(const std::vector<int32_t>& above, size_t place, int32_t a0, bool black) {
   place = place > 1 ? place - 2 : 0;
   if ((place % 2 != 0) != black) ++place;
@@ -66,7 +69,8 @@ size_t FindB1(const std::vector<int32_t>& above, size_t place, int32_t a0, bool 
 
 void FillBits(std::span<uint8_t> row, int32_t from, int32_t to) {
   const auto first = static_cast<size_t>(from / 8), last = static_cast<size_t>(to / 8);
-  const auto head = static_cast<uint8_t>(0xff >> from % 8), tail = static_cast<uint8_t>(~(0xff >> to % 8));
+  const auto head = static_cast<uint8_t>(0xff >> from % 8),
+             tail = static_cast<uint8_t>(~(0xff >> to % 8));
   if (first == last) {
     row[first] |= head & tail;
     return;
@@ -86,7 +90,9 @@ void AddChange(std::vector<int32_t>& changes, int32_t column) {
 }
 
 // Ends a list of changes so that searches stop without asking where it ends.
-void EndChanges(std::vector<int32_t>& changes, int32_t width) { changes.insert(changes.end(), 4, width); }
+void EndChanges(std::vector<int32_t>& changes, int32_t width) {
+  changes.insert(changes.end(), 4, width);
+}
 
 // The next column from `x` on whose pixel is not of `black`'s color; `width` when there is none.
 int32_t NextChange(std::span<const uint8_t> row, int32_t x, int32_t width, bool black) {
@@ -109,7 +115,8 @@ T6Decoder::T6Decoder(std::span<const uint8_t> data, int32_t width) : data_(data)
 uint32_t T6Decoder::PeekBits() {
   const uint64_t byte = bit_ / 8;
   uint32_t bits = 0;
-  for (uint64_t i = 0; i < 3; ++i) bits = bits << 8 | (byte + i < data_.size() ? data_[byte + i] : 0u);
+  for (uint64_t i = 0; i < 3; ++i)
+    bits = bits << 8 | (byte + i < data_.size() ? data_[byte + i] : 0u);
   return bits >> (24 - kLongestWord - bit_ % 8) & ((1u << kLongestWord) - 1);
 }
 
@@ -118,7 +125,8 @@ Status T6Decoder::ReadRun(bool black, int32_t& length) {
   length = 0;
   for (;;) {
     const Word word = table[PeekBits()];
-    if (word.value < 0) return bit_ / 8 >= data_.size() ? Status::FileReadError : Status::DamagedFile;
+    if (word.value < 0)
+      return bit_ / 8 >= data_.size() ? Status::FileReadError : Status::DamagedFile;
     SkipBits(word.bits);
     length += word.value;
     if (length > width_) return Status::DamagedFile;
@@ -133,7 +141,8 @@ Status T6Decoder::ReadChanges() {
   size_t place = 0;
   while (a0 < width_) {
     const Word word = ModeTable()[PeekBits()];
-    if (word.value < 0) return bit_ / 8 + 2 >= data_.size() ? Status::FileReadError : Status::DamagedFile;
+    if (word.value < 0)
+      return bit_ / 8 + 2 >= data_.size() ? Status::FileReadError : Status::DamagedFile;
     SkipBits(word.bits);
     if (bit_ > 8 * data_.size()) return Status::FileReadError;
     place = FindB1(above_, place, a0, black);
@@ -183,7 +192,8 @@ void T6Encoder::Put(const char* word) {
 
 void T6Encoder::PutRun(bool black, int32_t length) {
   const auto& words = black ? kBlackRunWords : kWhiteRunWords;
-  for (; length > kLongestRun + 63; length -= kLongestRun) Put(kLongRunWords[std::size(kLongRunWords) - 1]);
+  for (; length > kLongestRun + 63; length -= kLongestRun)
+    Put(kLongRunWords[std::size(kLongRunWords) - 1]);
   if (length >= kFirstLongRun) {
     Put(kLongRunWords[(length - kFirstLongRun) / 64]);
   } else if (length >= 64) {
@@ -195,7 +205,8 @@ void T6Encoder::PutRun(bool black, int32_t length) {
 void T6Encoder::EncodeRow(std::span<const uint8_t> row) {
   current_.clear();
   bool black = false;
-  for (int32_t x = 0; (x = NextChange(row, x, width_, black)) < width_; black = !black) current_.push_back(x);
+  for (int32_t x = 0; (x = NextChange(row, x, width_, black)) < width_; black = !black)
+    current_.push_back(x);
   EndChanges(current_, width_);
 
   int32_t a0 = -1;
@@ -203,7 +214,8 @@ void T6Encoder::EncodeRow(std::span<const uint8_t> row) {
   size_t place = 0, next = 0;
   while (a0 < width_) {
     place = FindB1(above_, place, a0, black);
-    const int32_t b1 = above_[place], b2 = above_[place + 1], a1 = current_[next], a2 = current_[next + 1];
+    const int32_t b1 = above_[place], b2 = above_[place + 1], a1 = current_[next],
+                  a2 = current_[next + 1];
     if (b2 < a1) {
       Put(kModeWords[static_cast<size_t>(FaxMode::Pass)]);
       a0 = b2;

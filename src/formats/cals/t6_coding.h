@@ -8,9 +8,9 @@
 
 namespace fotomill {
 
-// Two-dimensional coding of black and white rows, as fax machines of group 4 send them: each row tells how the places
-// where its color changes differ from those of the row above. Rows are packed, the leftmost pixel in the highest bit, and 1
-// is black. Source: ITU-T T.6 (1988).
+// Two-dimensional coding of black and white rows, as fax machines of group 4 send them: each row
+// tells how the places where its color changes differ from those of the row above. Rows are packed,
+// the leftmost pixel in the highest bit, and 1 is black. Source: ITU-T T.6 (1988).
 
 // Decodes row after row; the data stay with their owner.
 class T6Decoder {
@@ -18,8 +18,9 @@ class T6Decoder {
   // `width` is at least 1.
   T6Decoder(std::span<const uint8_t> data, int32_t width);
 
-  // Decodes the next row into (width + 7) / 8 bytes; bits behind the last pixel are 0. Ok; FileReadError when the data end
-  // before the row does, DamagedFile for a word that no encoder writes.
+  // Decodes the next row into (width + 7) / 8 bytes; bits behind the last pixel are 0. Ok;
+  // FileReadError when the data end before the row does, DamagedFile for a word that no encoder
+  // writes.
   Status DecodeRow(std::span<uint8_t> row);
 
  private:
@@ -31,7 +32,8 @@ class T6Decoder {
   std::span<const uint8_t> data_;
   const int32_t width_;
   uint64_t bit_ = 0;                     // place of the next bit in the data
-  std::vector<int32_t> above_, current_;  // columns where the color changes, white first; then the width, three times
+  // columns where the color changes, white first; then the width, three times
+  std::vector<int32_t> above_, current_;
 };
 
 // Codes rows and gathers the bytes.

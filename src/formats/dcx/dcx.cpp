@@ -5,9 +5,9 @@
 //        4  4 x n  offsets of the pages from the start of the file, 1023 at most, then 0
 //        .       pages, each a PCX file
 //
-// A page ends where the next one in the file begins; the order of the offsets is that of the pages. The writer leaves
-// room for all offsets, as other programs do.
-// Source: ZSoft Corporation, "PCX Technical Reference Manual", revision 5 (1991).
+// A page ends where the next one in the file begins; the order of the offsets is that of the pages.
+// The writer leaves room for all offsets, as other programs do. Source: ZSoft Corporation, "PCX
+// Technical Reference Manual", revision 5 (1991).
 #include "formats/dcx/dcx.h"
 
 #include <algorithm>
@@ -25,18 +25,23 @@ constexpr uint32_t kSignature = 0x3ADE68B1;
 constexpr size_t kMostPages = 1023;
 constexpr uint64_t kDirectorySize = 4 + 4 * (kMostPages + 1);
 
-// FileReadError for a file without room for a signature, DamagedFile, NoImages for a collection without pages.
+// FileReadError for a file without room for a signature, DamagedFile, NoImages for a collection
+// without pages.
 Status ReadDirectory(std::span<const uint8_t> head, std::vector<uint32_t>& pages) {
   ByteReader bytes(head);
   const uint32_t signature = bytes.Le32();
   if (!bytes.Ok()) return Status::FileReadError;
   if (signature != kSignature) return Status::DamagedFile;
-  for (uint32_t offset = bytes.Le32(); offset != 0 && pages.size() < kMostPages; offset = bytes.Le32()) pages.push_back(offset);
+  for (uint32_t offset = bytes.Le32(); offset != 0 && pages.size() < kMostPages;
+       offset = bytes.Le32())
+    pages.push_back(offset);
   return pages.empty() ? Status::NoImages : Status::Ok;
 }
 
-// Where a page of the file lies. NoImages when there is no such page, FileReadError when it lies behind the end.
-Status FindPage(const platform::FileView& file, int32_t page, PictureRecord& picture, PcxPlace& place) {
+// Where a page of the file lies. NoImages when there is no such page, FileReadError when it lies
+// behind the end.
+Status FindPage(const platform::FileView& file, int32_t page, PictureRecord& picture,
+                PcxPlace& place) {
   picture.typeName.Clear();
   picture.fileSize = file.FileSize();
   std::vector<uint32_t> pages;

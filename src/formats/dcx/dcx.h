@@ -6,8 +6,9 @@
 
 namespace fotomill {
 
-// DCX, a collection of PCX pictures. Statuses: those of PCX for the page that is asked for, DamagedFile (2) without the
-// signature, FileReadError (3) for a page behind the end of the file, NoImages (20) for a page that the file does not have.
+// DCX, a collection of PCX pictures. Statuses: those of PCX for the page that is asked for,
+// DamagedFile (2) without the signature, FileReadError (3) for a page behind the end of the file,
+// NoImages (20) for a page that the file does not have.
 Status DcxInfo(PictureRecord& picture, const ReadRequest& request);
 Status DcxRead(PictureRecord& picture, const ReadRequest& request);
 // Writes a collection of one page. Statuses of PCX.

@@ -1,20 +1,24 @@
-// Flexible Image Transport System (FITS): a header of text cards, then the values of one gray picture, big-endian.
+// Flexible Image Transport System (FITS): a header of text cards, then the values of one gray
+// picture, big-endian.
 //
 //   offset size  content
-//        0   80  a card: keyword of up to 8 characters, "=" in column 9, value; the first keyword is SIMPLE
+//        0   80  a card: keyword of up to 8 characters, "=" in column 9, value; the first keyword
+//        is SIMPLE
 //       80   80  ...
 //        .   80  the last card, END
-//        .    .  from the next multiple of 2880: NAXIS2 rows, the top one first, of NAXIS1 values of |BITPIX| bits
-//        .    .  zeros up to a multiple of 2880
+//        .    .  from the next multiple of 2880: NAXIS2 rows, the top one first, of NAXIS1 values
+//        of |BITPIX| bits .    .  zeros up to a multiple of 2880
 //
-// Reads a card as its keyword up to the first blank or "=", then its value behind all blanks and "="; a repeated
-// keyword counts as it stands last. Of more than two axes the first plane is read. The picture shows the first bytes of
-// each row as they are in the file, one byte a pixel, through a gray palette: values wider than a byte show as their
-// single bytes, and BSCALE and BZERO change nothing.
+// Reads a card as its keyword up to the first blank or "=", then its value behind all blanks and
+// "="; a repeated keyword counts as it stands last. Of more than two axes the first plane is read.
+// The picture shows the first bytes of each row as they are in the file, one byte a pixel, through
+// a gray palette: values wider than a byte show as their single bytes, and BSCALE and BZERO change
+// nothing.
 //
 // Writes eleven cards and one byte of gray per pixel.
 //
-// Source: IAU FITS Working Group, "Definition of the Flexible Image Transport System (FITS)", version 4.0 (2018).
+// Source: IAU FITS Working Group, "Definition of the Flexible Image Transport System (FITS)",
+// version 4.0 (2018).
 #include "formats/fits/fits.h"
 
 #include <algorithm>
@@ -49,7 +53,8 @@ struct FitsCard {
 };
 
 struct FitsHeader {
-  int64_t bitsPerValue = 1;  // BITPIX without its sign; these numbers are as the file claims until CheckHeader
+  // BITPIX without its sign; these numbers are as the file claims until CheckHeader
+  int64_t bitsPerValue = 1;
   int64_t axes = 0;
   int64_t width = 0;
   int64_t height = 0;
@@ -92,8 +97,8 @@ FitsHeader ParseHeader(std::span<const uint8_t> fileBytes) {
   return header;
 }
 
-// Ok; NoImages without a width or height; DamagedFile when a number is negative or absurd, or a value has no
-// whole byte.
+// Ok; NoImages without a width or height; DamagedFile when a number is negative or absurd, or a
+// value has no whole byte.
 Status CheckHeader(const FitsHeader& header) {
   if (header.width == 0 || header.height == 0) return Status::NoImages;
   for (const int64_t number : {header.axes, header.width, header.height, header.bitsPerValue}) {
@@ -102,16 +107,19 @@ Status CheckHeader(const FitsHeader& header) {
   return header.bitsPerValue < 8 ? Status::DamagedFile : Status::Ok;
 }
 
-// As much of a row of the file as fits the row of the picture, which may take in bytes beyond its pixels.
+// As much of a row of the file as fits the row of the picture, which may take in bytes beyond its
+// pixels.
 void CopyRow(std::span<const uint8_t> fileRow, std::span<uint8_t> row) {
   const size_t count = std::min(fileRow.size(), row.size());
   std::memcpy(row.data(), fileRow.data(), count);
   std::memset(row.data() + count, 0, row.size() - count);
 }
 
-// So many hundredths of a level, rounded down. A product and a shift in place of a division: compilers do that for many
-// levels at once.
-constexpr uint32_t Share(uint8_t level, uint32_t hundredths) { return level * ((hundredths * 65536 + 99) / 100) >> 16; }
+// So many hundredths of a level, rounded down. A product and a shift in place of a division:
+// compilers do that for many levels at once.
+constexpr uint32_t Share(uint8_t level, uint32_t hundredths) {
+  return level * ((hundredths * 65536 + 99) / 100) >> 16;
+}
 
 // Each channel's share is rounded for itself.
 constexpr uint32_t kRed = 30, kGreen = 59, kBlue = 11;
@@ -154,7 +162,8 @@ void GrayBytes(const uint8_t* pixels, const GrayTable& grays, size_t count, uint
 }
 
 void GrayColors(const uint8_t* pixels, const GrayTable&, size_t count, uint8_t* out) {
-  constexpr size_t kPiece = 1024;  // the formula runs over planes, which compilers turn into vectors
+  // the formula runs over planes, which compilers turn into vectors
+  constexpr size_t kPiece = 1024;
   uint8_t blue[kPiece], green[kPiece], red[kPiece];
   for (size_t begin = 0; begin < count; begin += kPiece) {
     const size_t size = std::min(count - begin, kPiece);
@@ -210,7 +219,8 @@ Status DescribePicture(const platform::FileView& file, PictureRecord& picture, F
   picture.imageBytes = EstimateImageBytes(picture.width, picture.height, 8);
   picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
   picture.palette = GrayRamp();
-  picture.typeName.AssignCut(std::to_string(header.axes) + " axis - " + std::to_string(header.bitsPerValue) + " bits of grey");
+  picture.typeName.AssignCut(std::to_string(header.axes) + " axis - " +
+                             std::to_string(header.bitsPerValue) + " bits of grey");
   return Status::Ok;
 }
 
@@ -218,7 +228,8 @@ Status DescribePicture(const platform::FileView& file, PictureRecord& picture, F
 Status CheckRowsFit(const platform::FileView& file, const FitsHeader& header) {
   uint64_t size = 0, end = 0;
   const bool counted =
-      CheckedMultiply(header.RowBytes(), static_cast<uint64_t>(header.height), size) && CheckedAdd(size, header.dataOffset, end);
+      CheckedMultiply(header.RowBytes(), static_cast<uint64_t>(header.height), size) &&
+      CheckedAdd(size, header.dataOffset, end);
   return header.ended && counted && end <= file.FileSize() ? Status::Ok : Status::FileReadError;
 }
 
@@ -226,7 +237,8 @@ Status CheckRowsFit(const platform::FileView& file, const FitsHeader& header) {
 
 Status FitsInfo(PictureRecord& picture, const ReadRequest& request) {
   platform::FileView file;
-  if (!file.OpenHead(request.fileName.c_str(), limits.fitsCards * kCardBytes)) return Status::FileOpenError;
+  if (!file.OpenHead(request.fileName.c_str(), limits.fitsCards * kCardBytes))
+    return Status::FileOpenError;
   if (file.Bytes().size() < kSignature.size()) return Status::FileReadError;
   if (!ByteReader(file.Bytes()).Match(kSignature)) return Status::DamagedFile;
   FitsHeader header;
@@ -283,7 +295,8 @@ Status FitsWrite(PictureRecord& picture, const WriteOptions& options) {
 Status FitsDetails(PictureRecord& picture) {
   picture.detailLines.Clear();
   platform::FileView file;
-  if (!file.OpenHead(picture.fileName.c_str(), kMostDetailLines * kCardBytes)) return Status::FileOpenError;
+  if (!file.OpenHead(picture.fileName.c_str(), kMostDetailLines * kCardBytes))
+    return Status::FileOpenError;
   ByteReader bytes(file.Bytes());
   FitsCard card;
   while (picture.detailLines.Count() < kMostDetailLines && NextCard(bytes, card)) {

@@ -10,7 +10,8 @@ using namespace std::string_view_literals;
 
 constexpr Signature kSignatures[] = {{0, "SIMPLE  ="sv, "FITS"}};
 
-constexpr FormatEntry Row(std::string_view extension, std::string_view description, uint32_t flags) {
+constexpr FormatEntry Row(std::string_view extension, std::string_view description,
+                          uint32_t flags) {
   return {.details = FitsDetails,
           .info = FitsInfo,
           .read = FitsRead,

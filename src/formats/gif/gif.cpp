@@ -8,23 +8,27 @@
 //       12    1  pixel aspect ratio
 //       13       global palette: red, green, blue, then blocks:
 //
-//   0x2C  picture: left, top, width, height (2 bytes each), flags (0x80 local palette and its size, 0x40 interlaced),
+//   0x2C  picture: left, top, width, height (2 bytes each), flags (0x80 local palette and its size,
+//   0x40 interlaced),
 //         the local palette, LZW data
-//   0x21  extension: label, then sub-blocks of 1 to 255 bytes and an empty one. 0xF9 graphic control: flags (bits 2-4
-//         disposal, bit 0 transparency), delay in 1/100 s (2 bytes), transparent index; 0xFE comment; 0xFF application
+//   0x21  extension: label, then sub-blocks of 1 to 255 bytes and an empty one. 0xF9 graphic
+//   control: flags (bits 2-4
+//         disposal, bit 0 transparency), delay in 1/100 s (2 bytes), transparent index; 0xFE
+//         comment; 0xFF application
 //   0x3B  end
 //
-// Interlaced rows come in four passes: every 8th from 0, every 8th from 4, every 4th from 2, every 2nd from 1.
+// Interlaced rows come in four passes: every 8th from 0, every 8th from 4, every 4th from 2, every
+// 2nd from 1.
 //
-// The reader shows a frame on the logical screen. A first frame that covers the screen and has no transparent index keeps
-// its palette at 1 to 8 bits; everything else becomes 24 bits with an alpha plane, the uncovered screen transparent, as
-// browsers show it. Frames beyond the screen are cut. A file without any palette is read as grays. Bytes of no meaning
-// between blocks are skipped. A missing end code is no fault, missing pixels are (status 3).
+// The reader shows a frame on the logical screen. A first frame that covers the screen and has no
+// transparent index keeps its palette at 1 to 8 bits; everything else becomes 24 bits with an alpha
+// plane, the uncovered screen transparent, as browsers show it. Frames beyond the screen are cut. A
+// file without any palette is read as grays. Bytes of no meaning between blocks are skipped. A
+// missing end code is no fault, missing pixels are (status 3).
 //
-// The writer makes one frame; 89a with the picture's comment when CreateGif89 is on, interlaced rows with
-// WriteGIFInterlaced.
-// Source: CompuServe, "Graphics Interchange Format, Version 89a" (1990); T. Welch, "A Technique for High-Performance Data
-// Compression", IEEE Computer 17 (1984).
+// The writer makes one frame; 89a with the picture's comment when CreateGif89 is on, interlaced
+// rows with WriteGIFInterlaced. Source: CompuServe, "Graphics Interchange Format, Version 89a"
+// (1990); T. Welch, "A Technique for High-Performance Data Compression", IEEE Computer 17 (1984).
 #include "formats/gif/gif.h"
 
 #include <algorithm>
@@ -52,16 +56,19 @@ bool KeepsPalette(const GifScreen& screen, const GifFrame& frame, int32_t page) 
 }
 
 // Facts of frame `page`, as far as its head tells. The reader stays behind that of the first one.
-Status DescribePicture(ByteReader& bytes, int32_t page, GifScreen& screen, GifFrame& frame, PictureRecord& picture) {
+Status DescribePicture(ByteReader& bytes, int32_t page, GifScreen& screen, GifFrame& frame,
+                       PictureRecord& picture) {
   RETURN_IF_BAD(ParseScreen(bytes, screen));
   RETURN_IF_BAD(NextFrame(bytes, screen, frame));
-  if (screen.width < 1 || screen.height < 1 || frame.width < 1 || frame.height < 1) return Status::DamagedFile;
+  if (screen.width < 1 || screen.height < 1 || frame.width < 1 || frame.height < 1)
+    return Status::DamagedFile;
   const bool keepsPalette = KeepsPalette(screen, frame, page);
   picture.typeName.AssignCut(screen.is89 ? "GIF 89a" : "GIF 87a");
   picture.width = screen.width;
   picture.height = screen.height;
   picture.bitsPerPixel = keepsPalette ? frame.Depth() : 24;
-  picture.alphaFlags = static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (keepsPalette ? 0 : kHasAlpha));
+  picture.alphaFlags =
+      static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (keepsPalette ? 0 : kHasAlpha));
   picture.imageBytes = EstimateImageBytes(picture.width, picture.height, picture.bitsPerPixel);
   if (keepsPalette) {
     TakeColors(frame, picture.palette);
@@ -85,7 +92,8 @@ void PackRow(const uint8_t* indices, int32_t width, int32_t bits, uint8_t* row) 
 }
 
 // A picture with its own palette.
-Status ReadIndexed(ByteReader& bytes, const GifFrame& frame, PictureRecord& picture, PackedImage& image) {
+Status ReadIndexed(ByteReader& bytes, const GifFrame& frame, PictureRecord& picture,
+                   PackedImage& image) {
   platform::MemoryBlock pixels;
   RETURN_IF_BAD(DecodeFrame(bytes, frame, pixels));
   RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette, picture.bitsPerPixel, image));
@@ -93,7 +101,8 @@ Status ReadIndexed(ByteReader& bytes, const GifFrame& frame, PictureRecord& pict
   for (int32_t r = 0; r < frame.height; ++r) {
     const int32_t y = frame.interlaced ? InterlacedRow(r, frame.height) : r;
     if (y >= rows) continue;
-    const uint8_t* source = pixels.Data() + static_cast<uint64_t>(r) * static_cast<uint64_t>(frame.width);
+    const uint8_t* source =
+        pixels.Data() + static_cast<uint64_t>(r) * static_cast<uint64_t>(frame.width);
     if (image.Bits() == 8) {
       std::memcpy(image.Row(y).data(), source, static_cast<size_t>(picture.width));
     } else {
@@ -105,7 +114,8 @@ Status ReadIndexed(ByteReader& bytes, const GifFrame& frame, PictureRecord& pict
 }
 
 // Draws the frames up to `last`. NoImages when there are fewer.
-Status ReadComposed(ByteReader& bytes, GifScreen& screen, GifFrame frame, int32_t last, Canvas& canvas) {
+Status ReadComposed(ByteReader& bytes, GifScreen& screen, GifFrame frame, int32_t last,
+                    Canvas& canvas) {
   GifDrawing drawing;
   RETURN_IF_BAD(drawing.Begin(screen, canvas));
   for (int32_t page = 0;; ++page) {

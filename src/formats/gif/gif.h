@@ -7,13 +7,13 @@
 
 namespace fotomill {
 
-// CompuServe GIF, 87a and 89a. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when data are cut short,
-// MemoryAllocationError (6), NoImages (20) for a file without a picture. `page` of the request selects a frame, which is shown
-// on what the frames before it left on the screen.
+// CompuServe GIF, 87a and 89a. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when
+// data are cut short, MemoryAllocationError (6), NoImages (20) for a file without a picture. `page`
+// of the request selects a frame, which is shown on what the frames before it left on the screen.
 Status GifInfo(PictureRecord& picture, const ReadRequest& request);
 Status GifRead(PictureRecord& picture, const ReadRequest& request);
-// Also UnsuitableImage (13) for sizes over 65535, TooManyColors (12) for 24-bit pictures, ErrorCreatingFile (10),
-// ErrorWritingFile (11).
+// Also UnsuitableImage (13) for sizes over 65535, TooManyColors (12) for 24-bit pictures,
+// ErrorCreatingFile (10), ErrorWritingFile (11).
 Status GifWrite(PictureRecord& picture, const WriteOptions& options);
 Status GifDetails(PictureRecord& picture);
 Status GifAnimate(const ReadRequest& request, AnimationPointer& animation);

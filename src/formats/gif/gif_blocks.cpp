@@ -54,12 +54,13 @@ void ParseFrame(ByteReader& bytes, GifScreen& screen, GifFrame& frame) {
   if (frame.palette.bits == 0) frame.palette = screen.palette;
   frame.dataOffset = bytes.Position();
   frame.pixelBits = bytes.U8();
-  if (screen.width == 0) screen.width = frame.left + frame.width;  // a screen without size is as large as its picture
+  // a screen without size is as large as its picture
+  if (screen.width == 0) screen.width = frame.left + frame.width;
   if (screen.height == 0) screen.height = frame.top + frame.height;
 }
 
-// How often the frames are played: the block that began with one browser and that all programs write since, in which
-// sub-block 1 is a number of repetitions.
+// How often the frames are played: the block that began with one browser and that all programs
+// write since, in which sub-block 1 is a number of repetitions.
 void ParseApplication(ByteReader& bytes, GifRemarks& remarks) {
   const auto name = bytes.Take(bytes.U8());
   const auto is = [&](std::string_view text) { return std::ranges::equal(name, text); };
@@ -134,7 +135,8 @@ int32_t InterlacedRow(int32_t r, int32_t height) {
   };
   constexpr Pass kPasses[] = {{0, 8}, {4, 8}, {2, 4}, {1, 2}};
   for (const Pass& pass : kPasses) {
-    const int32_t rows = height > pass.first ? (height - pass.first + pass.step - 1) / pass.step : 0;
+    const int32_t rows =
+        height > pass.first ? (height - pass.first + pass.step - 1) / pass.step : 0;
     if (r < rows) return pass.first + r * pass.step;
     r -= rows;
   }

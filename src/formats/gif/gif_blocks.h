@@ -50,10 +50,14 @@ struct GifFrame {
   // Bits per pixel of the picture that this frame is. Two-color frames are coded with 2 bits.
   int32_t Depth() const {
     if (palette.bits == 0) return std::clamp<int32_t>(pixelBits, 1, 8);
-    return palette.bits == 1 && pixelBits <= 2 ? 1 : std::clamp<int32_t>(std::max<int32_t>(palette.bits, pixelBits), 1, 8);
+    return palette.bits == 1 && pixelBits <= 2
+               ? 1
+               : std::clamp<int32_t>(std::max<int32_t>(palette.bits, pixelBits), 1, 8);
   }
   // No other frame shows beside it.
-  bool Covers(const GifScreen& screen) const { return left == 0 && top == 0 && width >= screen.width && height >= screen.height; }
+  bool Covers(const GifScreen& screen) const {
+    return left == 0 && top == 0 && width >= screen.width && height >= screen.height;
+  }
 };
 
 // What lies between the frames.
@@ -65,9 +69,10 @@ struct GifRemarks {
 
 // DamagedFile without the signature, FileReadError when the header is cut short.
 Status ParseScreen(ByteReader& bytes, GifScreen& screen);
-// Moves on to the next frame, up to its LZW data. NoImages when the file ends properly before one, FileReadError when it is
-// cut short.
-Status NextFrame(ByteReader& bytes, GifScreen& screen, GifFrame& frame, GifRemarks* remarks = nullptr);
+// Moves on to the next frame, up to its LZW data. NoImages when the file ends properly before one,
+// FileReadError when it is cut short.
+Status NextFrame(ByteReader& bytes, GifScreen& screen, GifFrame& frame,
+                 GifRemarks* remarks = nullptr);
 // Passes over the LZW data of a frame.
 void SkipFrame(ByteReader& bytes);
 
@@ -75,8 +80,8 @@ void SkipFrame(ByteReader& bytes);
 void TakeColors(const GifFrame& frame, Palette& palette);
 // The file row that comes as number `r` of an interlaced picture.
 int32_t InterlacedRow(int32_t r, int32_t height);
-// The indices of a frame in the order of the file; the reader is left behind it. FileReadError before any memory is taken
-// when the data cannot hold so many.
+// The indices of a frame in the order of the file; the reader is left behind it. FileReadError
+// before any memory is taken when the data cannot hold so many.
 Status DecodeFrame(ByteReader& bytes, const GifFrame& frame, platform::MemoryBlock& pixels);
 
 }  // namespace fotomill

@@ -12,7 +12,8 @@ using namespace gif;
 
 namespace {
 
-// Calls `visit(r, y, count)` for every row of the frame, as its own and the screen's, of which `count` pixels lie on the screen.
+// Calls `visit(r, y, count)` for every row of the frame, as its own and the screen's, of which
+// `count` pixels lie on the screen.
 template <typename Visit>
 void ForVisibleRows(const GifFrame& frame, const Canvas& canvas, Visit visit) {
   const int32_t count = std::min(frame.width, canvas.image.Width() - frame.left);
@@ -30,7 +31,8 @@ std::vector<int32_t> RowOrder(const GifFrame& frame) {
   return order;
 }
 
-void DrawRow(const uint8_t* indices, size_t count, int32_t transparent, const Palette& palette, uint8_t* color, uint8_t* alpha) {
+void DrawRow(const uint8_t* indices, size_t count, int32_t transparent, const Palette& palette,
+             uint8_t* color, uint8_t* alpha) {
   for (size_t x = 0; x < count; ++x, color += 3) {
     if (indices[x] == transparent) continue;
     const uint8_t* entry = &palette[size_t{3} * indices[x]];
@@ -41,7 +43,9 @@ void DrawRow(const uint8_t* indices, size_t count, int32_t transparent, const Pa
   }
 }
 
-uint8_t* ColorsAt(Canvas& canvas, int32_t x, int32_t y) { return canvas.image.Row(y).data() + 3 * static_cast<size_t>(x); }
+uint8_t* ColorsAt(Canvas& canvas, int32_t x, int32_t y) {
+  return canvas.image.Row(y).data() + 3 * static_cast<size_t>(x);
+}
 uint8_t* AlphaAt(Canvas& canvas, int32_t x, int32_t y) { return canvas.alpha.Row(y).data() + x; }
 
 class GifAnimation final : public Animation {
@@ -54,7 +58,8 @@ class GifAnimation final : public Animation {
     GifFrame frame;
     GifRemarks remarks;
     Status status = NextFrame(bytes, screen_, frame, &remarks);
-    for (; status == Status::Ok && delays_.size() < limits.animationFrames; status = NextFrame(bytes, screen_, frame, &remarks)) {
+    for (; status == Status::Ok && delays_.size() < limits.animationFrames;
+         status = NextFrame(bytes, screen_, frame, &remarks)) {
       delays_.push_back(frame.delay * 10);
       SkipFrame(bytes);
     }
@@ -101,8 +106,8 @@ Status GifDrawing::Draw(ByteReader& bytes, const GifFrame& frame, Canvas& canvas
   const std::vector<int32_t> order = RowOrder(frame);
   ForVisibleRows(frame, canvas, [&](int32_t r, int32_t y, size_t count) {
     const auto row = static_cast<uint64_t>(order[static_cast<size_t>(r)]);
-    DrawRow(pixels.Data() + row * static_cast<uint64_t>(frame.width), count, frame.transparent, palette,
-            ColorsAt(canvas, frame.left, y), AlphaAt(canvas, frame.left, y));
+    DrawRow(pixels.Data() + row * static_cast<uint64_t>(frame.width), count, frame.transparent,
+            palette, ColorsAt(canvas, frame.left, y), AlphaAt(canvas, frame.left, y));
   });
   last_ = frame;
   return Status::Ok;
@@ -112,7 +117,8 @@ Status GifDrawing::Draw(ByteReader& bytes, const GifFrame& frame, Canvas& canvas
 Status GifDrawing::KeepBeneath(const GifFrame& frame, const Canvas& canvas) {
   uint64_t size = 0;
   ForVisibleRows(frame, canvas, [&](int32_t, int32_t, size_t count) { size += 4 * count; });
-  if (size > 0 && !beneath_.Allocate(size, platform::Fill::Unset)) return Status::MemoryAllocationError;
+  if (size > 0 && !beneath_.Allocate(size, platform::Fill::Unset))
+    return Status::MemoryAllocationError;
   uint8_t* kept = beneath_.Data();
   ForVisibleRows(frame, canvas, [&](int32_t, int32_t y, size_t count) {
     const auto left = static_cast<size_t>(frame.left);
@@ -142,7 +148,8 @@ void GifDrawing::Dispose(Canvas& canvas) {
 int32_t CountGifFrames(ByteReader bytes, GifScreen screen) {
   uint32_t count = 1;
   GifFrame frame;
-  for (SkipFrame(bytes); count < limits.animationFrames && NextFrame(bytes, screen, frame) == Status::Ok; ++count)
+  for (SkipFrame(bytes);
+       count < limits.animationFrames && NextFrame(bytes, screen, frame) == Status::Ok; ++count)
     SkipFrame(bytes);
   return static_cast<int32_t>(count);
 }

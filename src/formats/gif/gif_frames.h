@@ -6,13 +6,14 @@
 
 namespace fotomill {
 
-// Draws the frames of a GIF in their order on the logical screen, each disposed of as it asks before the next one.
+// Draws the frames of a GIF in their order on the logical screen, each disposed of as it asks
+// before the next one.
 class GifDrawing {
  public:
   // Begins with a transparent canvas of the screen's size. Statuses as NewCanvas.
   Status Begin(const GifScreen& screen, Canvas& canvas);
-  // Draws a frame from the data behind `bytes`, which are left behind it. Statuses as DecodeFrame; DamagedFile for a frame
-  // without size.
+  // Draws a frame from the data behind `bytes`, which are left behind it. Statuses as DecodeFrame;
+  // DamagedFile for a frame without size.
   Status Draw(ByteReader& bytes, const GifFrame& frame, Canvas& canvas);
 
  private:
@@ -23,8 +24,8 @@ class GifDrawing {
   platform::MemoryBlock beneath_;  // what was there before it, if it wants that back
 };
 
-// The number of frames in a file of which the reader stands behind the head of the first one. Counted as far as the file is
-// whole.
+// The number of frames in a file of which the reader stands behind the head of the first one.
+// Counted as far as the file is whole.
 int32_t CountGifFrames(ByteReader bytes, GifScreen screen);
 
 }  // namespace fotomill

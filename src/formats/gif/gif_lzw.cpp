@@ -41,14 +41,15 @@ class CodeReader {
   uint32_t held_ = 0;
 };
 
-// The position of a code's string in the decoded pixels. A new string is the previous one plus its next pixel, which the output
-// already contains.
+// The position of a code's string in the decoded pixels. A new string is the previous one plus its
+// next pixel, which the output already contains.
 struct DecodedString {
   uint64_t start;
   uint32_t length;
 };
 
-// Copies forward byte by byte where the places overlap, as a string that ends in its own beginning needs it.
+// Copies forward byte by byte where the places overlap, as a string that ends in its own beginning
+// needs it.
 void CopyString(uint8_t* to, const uint8_t* from, uint64_t length) {
   if (to - from >= static_cast<std::ptrdiff_t>(length)) {
     std::memcpy(to, from, length);
@@ -97,7 +98,8 @@ Status DecodeGifPixels(ByteReader& bytes, std::span<uint8_t> pixels) {
   return Status::Ok;
 }
 
-GifPixelEncoder::GifPixelEncoder(ByteWriter& out, int32_t bits) : out_(out), clearCode_(1u << std::max(bits, 2)) {
+GifPixelEncoder::GifPixelEncoder(ByteWriter& out, int32_t bits)
+    : out_(out), clearCode_(1u << std::max(bits, 2)) {
   out_.U8(static_cast<uint8_t>(std::max(bits, 2)));
   ClearTable();
   PutCode(clearCode_);

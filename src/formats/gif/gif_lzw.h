@@ -9,12 +9,14 @@
 
 namespace fotomill {
 
-// The variable-length-code LZW of GIF: codes of up to 12 bits, least significant bit first, in sub-blocks of up to 255
-// bytes that end in an empty one. The first byte is the number of bits of a pixel, from 2 to 8.
+// The variable-length-code LZW of GIF: codes of up to 12 bits, least significant bit first, in
+// sub-blocks of up to 255 bytes that end in an empty one. The first byte is the number of bits of a
+// pixel, from 2 to 8.
 
-// Decodes pixels.size() indices from `bytes`, which stands at the first byte. Ok as soon as all pixels are there, whether
-// or not an end code follows; the reader is then left somewhere in the data. DamagedFile for a code that cannot be or a
-// pixel size outside 1 to 8, FileReadError when the data end too early.
+// Decodes pixels.size() indices from `bytes`, which stands at the first byte. Ok as soon as all
+// pixels are there, whether or not an end code follows; the reader is then left somewhere in the
+// data. DamagedFile for a code that cannot be or a pixel size outside 1 to 8, FileReadError when
+// the data end too early.
 Status DecodeGifPixels(ByteReader& bytes, std::span<uint8_t> pixels);
 
 // Encodes indices of `bits` per pixel (1 to 8), handed over piece by piece in any lengths.

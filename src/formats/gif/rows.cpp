@@ -28,7 +28,8 @@ constexpr FormatEntry kRows[] = {{
     .extension = "GIF"sv,
     .description = "(GIF) CompuServe"sv,
     .enabled = 1,
-    .flags = FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_PAGES | FMT_TIMED | FMT_FRAMES | FMT_LAYERED | FMT_TRANSPARENT,
+    .flags = FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_PAGES | FMT_TIMED | FMT_FRAMES |
+             FMT_LAYERED | FMT_TRANSPARENT,
     .animate = GifAnimate,
     .canRead = true,
     .canWrite = true,

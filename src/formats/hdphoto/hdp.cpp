@@ -1,13 +1,14 @@
-// HD Photo, also known as JPEG XR: hdp_file.cpp has the layout, hdp_codec.cpp the door to the library, hdp_write.cpp
-// writes.
+// HD Photo, also known as JPEG XR: hdp_file.cpp has the layout, hdp_codec.cpp the door to the
+// library, hdp_write.cpp writes.
 //
-// What the reader makes of it: one bit stays one bit, grays become 8 bits, everything else 24 bits, with an alpha plane
-// where the file has alpha; colors that were multiplied by it are divided again. Whole numbers of more than 8 bits are
-// rounded; real numbers and those with a binary point are linear light and get the curve of sRGB, 0 being black and 1
-// white. CMYK is turned into RGB by the usual formula. Brightness and color differences that were never RGB (video) are
-// refused, as are pictures of other channels. The turn is not applied: it travels in an EXIF block. XMP, ICC profile,
-// description, EXIF and resolution travel with the picture. Further pages are read by number. Source: ITU-T T.832
-// (2019); IEC 61966-2-2 for the linear ranges.
+// What the reader makes of it: one bit stays one bit, grays become 8 bits, everything else 24 bits,
+// with an alpha plane where the file has alpha; colors that were multiplied by it are divided
+// again. Whole numbers of more than 8 bits are rounded; real numbers and those with a binary point
+// are linear light and get the curve of sRGB, 0 being black and 1 white. CMYK is turned into RGB by
+// the usual formula. Brightness and color differences that were never RGB (video) are refused, as
+// are pictures of other channels. The turn is not applied: it travels in an EXIF block. XMP, ICC
+// profile, description, EXIF and resolution travel with the picture. Further pages are read by
+// number. Source: ITU-T T.832 (2019); IEC 61966-2-2 for the linear ranges.
 #include "formats/hdphoto/hdp.h"
 
 #include <algorithm>
@@ -30,7 +31,9 @@ constexpr double kFixed16One = 1 << 13, kFixed32One = 1 << 24;
 constexpr int kRgbeBias = 128 + 8;
 
 uint8_t Rounded(double value) {
-  return !(value > 0) ? uint8_t{0} : value >= 1 ? uint8_t{255} : static_cast<uint8_t>(value * 255 + 0.5);
+  return !(value > 0) ? uint8_t{0}
+         : value >= 1 ? uint8_t{255}
+                      : static_cast<uint8_t>(value * 255 + 0.5);
 }
 
 // Linear light, 0 to 1 in 65535 steps, on the curve of sRGB. Source: IEC 61966-2-1.
@@ -39,7 +42,8 @@ const std::vector<uint8_t>& SrgbCurve() {
     std::vector<uint8_t> values(65536);
     for (size_t i = 0; i < values.size(); ++i) {
       const double light = static_cast<double>(i) / 65535;
-      values[i] = Rounded(light <= 0.0031308 ? 12.92 * light : 1.055 * std::pow(light, 1 / 2.4) - 0.055);
+      values[i] =
+          Rounded(light <= 0.0031308 ? 12.92 * light : 1.055 * std::pow(light, 1 / 2.4) - 0.055);
     }
     return values;
   }();
@@ -47,7 +51,9 @@ const std::vector<uint8_t>& SrgbCurve() {
 }
 
 uint8_t OfLight(double light, const std::vector<uint8_t>& curve) {
-  return !(light > 0) ? uint8_t{0} : light >= 1 ? uint8_t{255} : curve[static_cast<size_t>(light * 65535 + 0.5)];
+  return !(light > 0) ? uint8_t{0}
+         : light >= 1 ? uint8_t{255}
+                      : curve[static_cast<size_t>(light * 65535 + 0.5)];
 }
 
 template <typename T>
@@ -59,8 +65,11 @@ T Load(const uint8_t* source) {
 
 double HalfToReal(uint16_t half) {
   const int exponent = half >> 10 & 31, fraction = half & 1023;
-  const double value = exponent == 0 ? std::ldexp(fraction, -24) : std::ldexp(fraction + 1024, exponent - 25);
-  return exponent == 31 ? (fraction == 0 && (half & 0x8000) == 0 ? 2 : 0) : (half & 0x8000) != 0 ? -value : value;
+  const double value =
+      exponent == 0 ? std::ldexp(fraction, -24) : std::ldexp(fraction + 1024, exponent - 25);
+  return exponent == 31         ? (fraction == 0 && (half & 0x8000) == 0 ? 2 : 0)
+         : (half & 0x8000) != 0 ? -value
+                                : value;
 }
 
 // A sample as a real number, 1 being white.
@@ -75,13 +84,17 @@ double RealSample(const uint8_t* source, HdpDepth depth) {
 }
 
 bool IsLinear(HdpDepth depth) {
-  return depth == HdpDepth::Fixed16 || depth == HdpDepth::Half || depth == HdpDepth::Fixed32 || depth == HdpDepth::Float;
+  return depth == HdpDepth::Fixed16 || depth == HdpDepth::Half || depth == HdpDepth::Fixed32 ||
+         depth == HdpDepth::Float;
 }
 
-// `count` samples of a row as bytes, `step` of which make a pixel, the last one being alpha when there is alpha.
-void SamplesToBytes(const uint8_t* row, HdpDepth depth, size_t count, size_t step, bool alpha, uint8_t* target) {
+// `count` samples of a row as bytes, `step` of which make a pixel, the last one being alpha when
+// there is alpha.
+void SamplesToBytes(const uint8_t* row, HdpDepth depth, size_t count, size_t step, bool alpha,
+                    uint8_t* target) {
   if (depth == HdpDepth::U16) {
-    for (size_t i = 0; i < count; ++i) target[i] = static_cast<uint8_t>((Load<uint16_t>(row + 2 * i) * 255u + 32895) >> 16);
+    for (size_t i = 0; i < count; ++i)
+      target[i] = static_cast<uint8_t>((Load<uint16_t>(row + 2 * i) * 255u + 32895) >> 16);
     return;
   }
   const size_t bytes = depth == HdpDepth::Fixed16 || depth == HdpDepth::Half ? 2 : 4;
@@ -93,7 +106,8 @@ void SamplesToBytes(const uint8_t* row, HdpDepth depth, size_t count, size_t ste
   }
 }
 
-// Pixels of 16 or 32 bits that hold three colors, the widths of which are given from the lowest bit up: blue first.
+// Pixels of 16 or 32 bits that hold three colors, the widths of which are given from the lowest bit
+// up: blue first.
 void PackedToBytes(const uint8_t* row, HdpDepth depth, int32_t width, uint8_t* image) {
   const uint32_t outer = depth == HdpDepth::Rgb101010 ? 10 : 5;
   const uint32_t middle = depth == HdpDepth::Rgb101010 ? 10 : depth == HdpDepth::Rgb565 ? 6 : 5;
@@ -102,8 +116,8 @@ void PackedToBytes(const uint8_t* row, HdpDepth depth, int32_t width, uint8_t* i
     return static_cast<uint8_t>(((value & most) * 255 + most / 2) / most);
   };
   for (int32_t x = 0; x < width; ++x, image += 3) {
-    const uint32_t pixel =
-        outer == 10 ? Load<uint32_t>(row + 4 * static_cast<size_t>(x)) : Load<uint16_t>(row + 2 * static_cast<size_t>(x));
+    const uint32_t pixel = outer == 10 ? Load<uint32_t>(row + 4 * static_cast<size_t>(x))
+                                       : Load<uint16_t>(row + 2 * static_cast<size_t>(x));
     image[0] = scaled(pixel, outer);
     image[1] = scaled(pixel >> outer, middle);
     image[2] = scaled(pixel >> (outer + middle), outer);
@@ -137,7 +151,8 @@ class HdpConverter {
     uint8_t* image = target_.image.Row(y).data();
     if (raster_.sampleBytes == 0) {
       std::memcpy(image, row, (static_cast<size_t>(form_.width) + 7) / 8);
-    } else if (form_.depth == HdpDepth::Rgb555 || form_.depth == HdpDepth::Rgb565 || form_.depth == HdpDepth::Rgb101010) {
+    } else if (form_.depth == HdpDepth::Rgb555 || form_.depth == HdpDepth::Rgb565 ||
+               form_.depth == HdpDepth::Rgb101010) {
       PackedToBytes(row, form_.depth, form_.width, image);
     } else if (form_.colors == HdpColors::Rgbe) {
       RgbeToBytes(row, form_.width, image);
@@ -152,7 +167,8 @@ class HdpConverter {
     samples_ = row;
     const bool deep = raster_.sampleBytes > 1;
     if (deep) {
-      SamplesToBytes(row, form_.depth, bytes_.size(), raster_.samples, raster_.alpha, bytes_.data());
+      SamplesToBytes(row, form_.depth, bytes_.size(), raster_.samples, raster_.alpha,
+                     bytes_.data());
       samples_ = bytes_.data();
     }
     const uint8_t* source = samples_;
@@ -171,7 +187,8 @@ class HdpConverter {
       case HdpColors::Cmyk:
         for (size_t x = 0; x < width; ++x, source += step, image += 3) {
           for (size_t i = 0; i < 3; ++i)
-            image[i] = static_cast<uint8_t>(((255u - source[2 - i]) * (255u - source[3]) + 127) / 255);
+            image[i] =
+                static_cast<uint8_t>(((255u - source[2 - i]) * (255u - source[3]) + 127) / 255);
         }
         break;
       default:
@@ -189,7 +206,10 @@ class HdpConverter {
       alpha[x] = *source;
       if (!multiplied_) continue;
       for (size_t i = 0; i < 3; ++i) {
-        image[i] = *source == 0 ? uint8_t{0} : static_cast<uint8_t>(std::min(255u, (image[i] * 255u + *source / 2u) / *source));
+        image[i] =
+            *source == 0
+                ? uint8_t{0}
+                : static_cast<uint8_t>(std::min(255u, (image[i] * 255u + *source / 2u) / *source));
       }
     }
   }
@@ -209,7 +229,8 @@ bool HasAlpha(const HdpPage& page) {
 
 int32_t BitsOf(const HdpPage& page) {
   if (page.image.colors != HdpColors::Gray || HasAlpha(page)) return 24;
-  return page.image.depth == HdpDepth::WhiteIsOne || page.image.depth == HdpDepth::BlackIsOne ? 1 : 8;
+  return page.image.depth == HdpDepth::WhiteIsOne || page.image.depth == HdpDepth::BlackIsOne ? 1
+                                                                                              : 8;
 }
 
 void Assign(std::vector<uint8_t>& block, std::span<const uint8_t> data) {
@@ -224,14 +245,16 @@ void TakeMetadata(std::span<const uint8_t> file, const HdpPage& page, PictureRec
   Assign(metadata.xmp, page.xmp);
   Assign(metadata.icc, page.icc);
   const auto end = std::find(page.description.begin(), page.description.end(), uint8_t{0});
-  Assign(picture.comment, page.description.first(static_cast<size_t>(end - page.description.begin())));
+  Assign(picture.comment,
+         page.description.first(static_cast<size_t>(end - page.description.begin())));
   if (page.dpiX > 0 && page.dpiY > 0 && std::isfinite(page.dpiX) && std::isfinite(page.dpiY)) {
     metadata.dpiX = page.dpiX;
     metadata.dpiY = page.dpiY;
   }
 }
 
-Status Describe(std::span<const uint8_t> file, int32_t index, HdpPage& page, PictureRecord& picture) {
+Status Describe(std::span<const uint8_t> file, int32_t index, HdpPage& page,
+                PictureRecord& picture) {
   RETURN_IF_BAD(ParseHdpPage(file, index, page));
   picture.pageCount = std::max(1, CountHdpPages(file));
   picture.typeName.AssignCut("HD Photo");
@@ -239,7 +262,8 @@ Status Describe(std::span<const uint8_t> file, int32_t index, HdpPage& page, Pic
   picture.height = page.image.height;
   picture.bitsPerPixel = BitsOf(page);
   picture.simplified = page.image.depth != HdpDepth::U8 || page.image.colors >= HdpColors::Cmyk;
-  picture.alphaFlags = static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (HasAlpha(page) ? kHasAlpha : 0));
+  picture.alphaFlags =
+      static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (HasAlpha(page) ? kHasAlpha : 0));
   picture.imageBytes = EstimateImageBytes(picture.width, picture.height, picture.bitsPerPixel);
   if (picture.bitsPerPixel == 24) {
     MakeDefaultPalette(&picture.palette, nullptr, kDisplayPalette);
@@ -251,8 +275,9 @@ Status Describe(std::span<const uint8_t> file, int32_t index, HdpPage& page, Pic
 }
 
 const char* ColorsName(HdpColors colors) {
-  constexpr const char* kNames[] = {"gray",         "YUV 4:2:0",    "YUV 4:2:2", "YUV 4:4:4", "CMYK",
-                                    "CMYK, direct", "any channels", "RGB",       "RGBE"};
+  constexpr const char* kNames[] = {"gray",         "YUV 4:2:0", "YUV 4:2:2",
+                                    "YUV 4:4:4",    "CMYK",      "CMYK, direct",
+                                    "any channels", "RGB",       "RGBE"};
   return kNames[static_cast<size_t>(colors)];
 }
 
@@ -264,7 +289,8 @@ const char* DepthName(HdpDepth depth) {
 }
 
 void AddDetails(const HdpPage& page, const PictureRecord& picture, DetailLines& lines) {
-  constexpr const char* kInternal[] = {"gray", "4:2:0", "4:2:2", "4:4:4", "CMYK", "?", "channels", "?"};
+  constexpr const char* kInternal[] = {"gray", "4:2:0", "4:2:2",    "4:4:4",
+                                       "CMYK", "?",     "channels", "?"};
   const HdpStream& image = page.image;
   lines.AddFormat("  Color space: %s", ColorsName(image.colors));
   lines.AddFormat("      Samples: %s", DepthName(image.depth));
@@ -278,7 +304,8 @@ void AddDetails(const HdpPage& page, const PictureRecord& picture, DetailLines& 
                     image.multiplied ? ", multiplied" : "");
   }
   const PictureMetadata& metadata = picture.metadata;
-  if (metadata.dpiX > 0) lines.AddFormat("   Resolution: %.0f x %.0f dpi", metadata.dpiX, metadata.dpiY);
+  if (metadata.dpiX > 0)
+    lines.AddFormat("   Resolution: %.0f x %.0f dpi", metadata.dpiX, metadata.dpiY);
   if (page.turn > 0) lines.AddFormat("  Orientation: %u", unsigned{OrientationOfTurn(page.turn)});
   if (!metadata.icc.empty()) lines.AddFormat("  ICC profile: %zu bytes", metadata.icc.size());
   if (!metadata.xmp.empty()) lines.AddFormat("          XMP: %zu bytes", metadata.xmp.size());

@@ -20,7 +20,8 @@ namespace {
 
 constexpr char kLibraryName[] = "libjpegxr.so.0";
 constexpr int32_t kBlock = 16;            // rows that the library handles at a time
-constexpr unsigned kSecondsAtLeast = 20;  // processor time for a picture; damaged data may keep the decoder busy
+// processor time for a picture; damaged data may keep the decoder busy
+constexpr unsigned kSecondsAtLeast = 20;
 constexpr uint64_t kPixelsPerSecond = 1'000'000;
 constexpr uint64_t kReadAhead = 3 * 4096;  // bytes that the decoder fetches before it needs them
 constexpr U8 kNoAlpha = 0, kAlphaToo = 2;  // uAlphaMode
@@ -37,8 +38,9 @@ struct JxrLibrary {
     encodeTerm = library.FunctionNamed<decltype(ImageStrEncTerm)>("ImageStrEncTerm");
   }
   bool Whole() const {
-    return decodeInfo != nullptr && decodeInit != nullptr && decode != nullptr && decodeTerm != nullptr &&
-           encodeInit != nullptr && encode != nullptr && encodeTerm != nullptr;
+    return decodeInfo != nullptr && decodeInit != nullptr && decode != nullptr &&
+           decodeTerm != nullptr && encodeInit != nullptr && encode != nullptr &&
+           encodeTerm != nullptr;
   }
 
   platform::SharedLibrary library;
@@ -56,11 +58,13 @@ const JxrLibrary& Library() {
   return library;
 }
 
-// The library's door to a codestream in memory, or to a file being written. It holds its own address, and stays in
-// place.
+// The library's door to a codestream in memory, or to a file being written. It holds its own
+// address, and stays in place.
 struct JxrStream : WMPStream {
   explicit JxrStream(std::span<const uint8_t> data) : WMPStream(), bytes(data) { Connect(); }
-  explicit JxrStream(ByteWriter& file) : WMPStream(), out(&file), start(file.Position()) { Connect(); }
+  explicit JxrStream(ByteWriter& file) : WMPStream(), out(&file), start(file.Position()) {
+    Connect();
+  }
   JxrStream(const JxrStream&) = delete;
   JxrStream& operator=(const JxrStream&) = delete;
 
@@ -80,7 +84,8 @@ ERR CloseNothing(WMPStream**) { return WMP_errSuccess; }
 void JxrStream::Connect() {
   Close = CloseNothing;
   EOS = [](WMPStream* stream) -> Bool { return Of(stream).position >= Of(stream).bytes.size(); };
-  // The library reads whole packets and so beyond the end of every file; what is not there is zeros.
+  // The library reads whole packets and so beyond the end of every file; what is not there is
+  // zeros.
   Read = [](WMPStream* stream, void* target, size_t count) -> ERR {
     JxrStream& self = Of(stream);
     const size_t left = self.bytes.size() - std::min(self.position, self.bytes.size());
@@ -112,7 +117,8 @@ void JxrStream::Connect() {
   };
 }
 
-// Samples of a pixel and bytes of a sample; 0 samples for what the library cannot hand out as pixels.
+// Samples of a pixel and bytes of a sample; 0 samples for what the library cannot hand out as
+// pixels.
 struct SampleShape {
   uint32_t samples, bytes;
 };
@@ -134,14 +140,17 @@ SampleShape ShapeOf(const HdpStream& stream) {
     case HdpColors::Gray: return {1, bytes};
     case HdpColors::Rgb: return {3, bytes};
     case HdpColors::Rgbe:
-    case HdpColors::Cmyk: return {bytes == 1 || (bytes == 2 && stream.colors == HdpColors::Cmyk) ? 4u : 0u, bytes};
+    case HdpColors::Cmyk:
+      return {bytes == 1 || (bytes == 2 && stream.colors == HdpColors::Cmyk) ? 4u : 0u, bytes};
     default: return {0, 0};
   }
 }
 
-// What the process apart is asked for: the sizes of the codestreams, which are its input one behind the other, and the raster.
+// What the process apart is asked for: the sizes of the codestreams, which are its input one behind
+// the other, and the raster.
 struct DecodeRequest {
-  uint64_t imageSize = 0, alphaSize = 0;  // bytes; without alphaSize, alpha comes with the colors if there is any
+  // bytes; without alphaSize, alpha comes with the colors if there is any
+  uint64_t imageSize = 0, alphaSize = 0;
   uint64_t stride = 0;
   int32_t width = 0, height = 0;
   uint32_t samples = 0, sampleBytes = 0;
@@ -167,7 +176,8 @@ bool DecodeStream(const DecodeJob& job, const DecodeRequest& request, std::span<
   parameters.pWStream = &source;
   parameters.uAlphaMode = job.alphaToo ? kAlphaToo : kNoAlpha;
   if (library.decodeInfo(&info, &parameters) != ICERR_OK) return false;
-  const auto width = static_cast<size_t>(request.width), height = static_cast<size_t>(request.height);
+  const auto width = static_cast<size_t>(request.width),
+             height = static_cast<size_t>(request.height);
   if (info.cWidth != width || info.cHeight != height) return false;
   info.cThumbnailWidth = info.cROIWidth = width;
   info.cThumbnailHeight = info.cROIHeight = height;
@@ -176,14 +186,16 @@ bool DecodeStream(const DecodeJob& job, const DecodeRequest& request, std::span<
   info.cBitsPerUnit = request.sampleBytes == 0 ? 1 : 8 * request.samples * request.sampleBytes;
   info.cLeadingPadding = job.firstSample;
   CTXSTRCODEC context = nullptr;
-  if (library.decodeInit(&info, &parameters, &context) != ICERR_OK || context == nullptr) return false;
+  if (library.decodeInit(&info, &parameters, &context) != ICERR_OK || context == nullptr)
+    return false;
   CWMImageBufferInfo buffer = {};
   buffer.pv = raster.data();
   buffer.cLine = height;
   buffer.cbStride = request.stride;
   const int32_t blocks = (request.height + kBlock - 1) / kBlock;
   bool decoded = true;
-  for (int32_t row = 0; decoded && row <= blocks; ++row) {  // each row of blocks is complete only with the next one
+  // each row of blocks is complete only with the next one
+  for (int32_t row = 0; decoded && row <= blocks; ++row) {
     size_t lines = 0;
     buffer.uiFirstMBRow = buffer.uiLastMBRow = static_cast<unsigned>(row);
     decoded = library.decode(context, &buffer, &lines) == ICERR_OK && !source.overrun;
@@ -196,17 +208,22 @@ bool DecodeStream(const DecodeJob& job, const DecodeRequest& request, std::span<
 
 Status MakeRaster(const HdpPage& page, HdpRaster& raster) {
   const SampleShape shape = ShapeOf(page.image);
-  const bool holdsAlpha = shape.samples >= 3 || (shape.samples == 1 && !page.alpha.bytes.empty() && shape.bytes > 0 &&
-                                                 page.image.colors == HdpColors::Gray);
-  raster.alpha = holdsAlpha && page.image.colors != HdpColors::Rgbe && (page.image.alpha || !page.alpha.bytes.empty());
+  const bool holdsAlpha =
+      shape.samples >= 3 || (shape.samples == 1 && !page.alpha.bytes.empty() && shape.bytes > 0 &&
+                             page.image.colors == HdpColors::Gray);
+  raster.alpha = holdsAlpha && page.image.colors != HdpColors::Rgbe &&
+                 (page.image.alpha || !page.alpha.bytes.empty());
   raster.samples = shape.samples + (raster.alpha ? 1 : 0);
   raster.sampleBytes = shape.bytes;
-  const auto width = static_cast<uint64_t>(page.image.width), height = static_cast<uint64_t>(page.image.height);
+  const auto width = static_cast<uint64_t>(page.image.width),
+             height = static_cast<uint64_t>(page.image.height);
   raster.stride = shape.bytes == 0 ? (width + 7) / 8 : width * raster.samples * shape.bytes;
   raster.stride = (raster.stride + 127) / 128 * 128;
   constexpr uint64_t kShare = 2;  // the picture is held as well
-  if (raster.stride > limits.packedBlockBytes / kShare / height) return Status::MemoryAllocationError;
-  return raster.block.Allocate(raster.stride * height + 1) ? Status::Ok : Status::MemoryAllocationError;
+  if (raster.stride > limits.packedBlockBytes / kShare / height)
+    return Status::MemoryAllocationError;
+  return raster.block.Allocate(raster.stride * height + 1) ? Status::Ok
+                                                           : Status::MemoryAllocationError;
 }
 
 }  // namespace
@@ -229,17 +246,20 @@ Status DecodeHdp(const HdpPage& page, HdpRaster& raster, const std::function<voi
                                  .sampleBytes = raster.sampleBytes,
                                  .alpha = raster.alpha};
   platform::MemoryBlock input;
-  if (!input.Allocate(request.imageSize + request.alphaSize, platform::Fill::Unset)) return Status::MemoryAllocationError;
+  if (!input.Allocate(request.imageSize + request.alphaSize, platform::Fill::Unset))
+    return Status::MemoryAllocationError;
   std::ranges::copy(page.image.bytes, input.Bytes().begin());
-  std::ranges::copy(page.alpha.bytes, input.Bytes().begin() + static_cast<ptrdiff_t>(request.imageSize));
-  const auto pixels = static_cast<uint64_t>(page.image.width) * static_cast<uint64_t>(page.image.height);
-  const platform::ApartResult result =
-      platform::RunApart({.task = kHdpTask,
-                          .request = {reinterpret_cast<const uint8_t*>(&request), sizeof request},
-                          .input = input.Bytes(),
-                          .reply = raster.block,
-                          .seconds = kSecondsAtLeast + static_cast<unsigned>(pixels / kPixelsPerSecond)},
-                         told);
+  std::ranges::copy(page.alpha.bytes,
+                    input.Bytes().begin() + static_cast<ptrdiff_t>(request.imageSize));
+  const auto pixels =
+      static_cast<uint64_t>(page.image.width) * static_cast<uint64_t>(page.image.height);
+  const platform::ApartResult result = platform::RunApart(
+      {.task = kHdpTask,
+       .request = {reinterpret_cast<const uint8_t*>(&request), sizeof request},
+       .input = input.Bytes(),
+       .reply = raster.block,
+       .seconds = kSecondsAtLeast + static_cast<unsigned>(pixels / kPixelsPerSecond)},
+      told);
   const bool overrun = raster.block.Bytes().back() != 0;
   switch (result) {
     case platform::ApartResult::Done: return overrun ? Status::FileReadError : Status::Ok;
@@ -253,12 +273,14 @@ bool DecodeHdpApart(const platform::ApartCall& call) {
   DecodeRequest request;
   if (call.request.size() != sizeof request || !HasHdpLibrary()) return false;
   std::memcpy(&request, call.request.data(), sizeof request);
-  if (request.imageSize + request.alphaSize != call.input.size() || request.RasterBytes() + 1 != call.reply.size()) return false;
+  if (request.imageSize + request.alphaSize != call.input.size() ||
+      request.RasterBytes() + 1 != call.reply.size())
+    return false;
   const std::span<uint8_t> raster = call.reply.first(request.RasterBytes());
   const bool apart = request.alphaSize > 0;
   bool overrun = false, alphaOverrun = false;
-  bool done =
-      DecodeStream({call.input.first(request.imageSize), 0, request.alpha != 0 && !apart}, request, raster, call.tell, overrun);
+  bool done = DecodeStream({call.input.first(request.imageSize), 0, request.alpha != 0 && !apart},
+                           request, raster, call.tell, overrun);
   if (done && request.alpha != 0 && apart) {
     const DecodeJob alpha = {call.input.subspan(request.imageSize), request.samples - 1, false};
     done = DecodeStream(
@@ -292,7 +314,8 @@ Status EncodeHdp(const PackedImage& image, const HdpEncoding& encoding, ByteWrit
   parameters.sbSubband = SB_ALL;
   parameters.uiDefaultQPIndex = static_cast<U8>(std::clamp(encoding.quantizer, 1, 255));
   CTXSTRCODEC context = nullptr;
-  if (library.encodeInit(&info, &parameters, &context) != ICERR_OK || context == nullptr) return Status::ResourceError;
+  if (library.encodeInit(&info, &parameters, &context) != ICERR_OK || context == nullptr)
+    return Status::ResourceError;
   // The library takes bands of 16 rows from the top, the image stores its rows from the bottom.
   platform::MemoryBlock band;
   bool done = band.Allocate(image.Stride() * kBlock);
@@ -300,7 +323,8 @@ Status EncodeHdp(const PackedImage& image, const HdpEncoding& encoding, ByteWrit
   for (int32_t top = 0; done && top < image.Height(); top += kBlock) {
     const int32_t rows = std::min(kBlock, image.Height() - top);
     for (int32_t r = 0; r < rows; ++r) {
-      std::memcpy(band.Data() + image.Stride() * static_cast<uint64_t>(r), image.Row(top + r).data(), image.Stride());
+      std::memcpy(band.Data() + image.Stride() * static_cast<uint64_t>(r),
+                  image.Row(top + r).data(), image.Stride());
     }
     CWMImageBufferInfo buffer = {};
     buffer.pv = band.Data();
@@ -310,7 +334,9 @@ Status EncodeHdp(const PackedImage& image, const HdpEncoding& encoding, ByteWrit
     for (int32_t r = 0; r < rows; ++r) report(top + r);
   }
   done = library.encodeTerm(context) == ICERR_OK && done;
-  return done && !out.Failed() ? Status::Ok : room ? Status::ErrorWritingFile : Status::MemoryAllocationError;
+  return done && !out.Failed() ? Status::Ok
+         : room                ? Status::ErrorWritingFile
+                               : Status::MemoryAllocationError;
 }
 
 }  // namespace fotomill

@@ -1,15 +1,17 @@
 // The file and the codestream of HD Photo, also known as JPEG XR.
 //
-//   "II", BC, version 0 or 1, offset of the first directory; directories are those of TIFF, little-endian
+//   "II", BC, version 0 or 1, offset of the first directory; directories are those of TIFF,
+//   little-endian
 //
 //   codestream, bits from the most significant one of each byte down:
 //   "WMPHOTO" 0, version (4 bits: 1), subversion (4)
 //   tiles (1), frequency order (1), turn (3), index table (1), overlap (2)
-//   short numbers (1), long words (1), window (1), trimmed (1), stretched tiles (1), red and blue (1), multiplied (1),
-//   alpha (1) colors (4), depth (4), width - 1, height - 1 (16 bits each when short, else 32) with tiles: columns - 1,
-//   rows - 1 of them (12 each), the width of each column but the last, the height of each row but the last, in blocks
-//   of 16 pixels (8 bits each when short, else 16) with a window: hidden pixels above, left, below, right (6 each); to
-//   the next byte plane: internal colors (3), scaled (1), bands (4), what the colors need, quantizers ...
+//   short numbers (1), long words (1), window (1), trimmed (1), stretched tiles (1), red and blue
+//   (1), multiplied (1), alpha (1) colors (4), depth (4), width - 1, height - 1 (16 bits each when
+//   short, else 32) with tiles: columns - 1, rows - 1 of them (12 each), the width of each column
+//   but the last, the height of each row but the last, in blocks of 16 pixels (8 bits each when
+//   short, else 16) with a window: hidden pixels above, left, below, right (6 each); to the next
+//   byte plane: internal colors (3), scaled (1), bands (4), what the colors need, quantizers ...
 // Source: ITU-T T.832 (2019), sections 8.3, 8.4 and annex A.
 #include "formats/hdphoto/hdp_file.h"
 
@@ -26,9 +28,12 @@ namespace fotomill {
 namespace {
 
 constexpr uint64_t kEntryBytes = 12;
-constexpr uint8_t kOrientations[] = {1, 4, 2, 3, 6, 7, 5, 8};                        // of EXIF, by turn
-constexpr uint32_t kBlock = 16;                                                      // pixels of a macroblock's side
-constexpr uint32_t kYuv420 = 1, kYuv422 = 2, kYuv444 = 3, kCmyk = 4, kChannels = 6;  // internal colors
+// of EXIF, by turn
+constexpr uint8_t kOrientations[] = {1, 4, 2, 3, 6, 7, 5, 8};
+// pixels of a macroblock's side
+constexpr uint32_t kBlock = 16;
+// internal colors
+constexpr uint32_t kYuv420 = 1, kYuv422 = 2, kYuv444 = 3, kCmyk = 4, kChannels = 6;
 
 // Bits from the most significant one down; past the end they are 0 and the reader is short.
 class BitReader {
@@ -57,8 +62,8 @@ class BitReader {
   unsigned left_ = 0;
 };
 
-// The widths of all columns (or heights of all rows) of tiles but the last: each at least one block, with one left
-// over.
+// The widths of all columns (or heights of all rows) of tiles but the last: each at least one
+// block, with one left over.
 bool TakeTileSides(BitReader& bits, uint32_t count, unsigned width, uint32_t blocks) {
   uint64_t sum = 0;
   bool valid = true;
@@ -72,7 +77,8 @@ bool TakeTileSides(BitReader& bits, uint32_t count, unsigned width, uint32_t blo
 
 // The quantizers of one band; whether they change nothing.
 bool TakeQuantizers(BitReader& bits, uint32_t channels) {
-  const uint32_t mode = channels > 1 ? bits.Take(2) : 0;  // one for all, one for luma and one for chroma, or each its own
+  // one for all, one for luma and one for chroma, or each its own
+  const uint32_t mode = channels > 1 ? bits.Take(2) : 0;
   const uint32_t count = mode == 0 ? 1 : mode == 1 ? 2 : channels;
   bool lossless = true;
   for (uint32_t i = 0; i < count; ++i) lossless = bits.Take(8) <= 1 && lossless;
@@ -98,7 +104,8 @@ void ParsePlane(BitReader& bits, HdpStream& stream) {
     default: break;
   }
   bool lossless = bands == 0 && !scaled && bits.Flag() && TakeQuantizers(bits, channels);
-  for (int band = 0; band < 2; ++band) {  // low and high frequencies, unless they use the quantizers before
+  // low and high frequencies, unless they use the quantizers before
+  for (int band = 0; band < 2; ++band) {
     if (lossless && !bits.Flag()) lossless = bits.Flag() && TakeQuantizers(bits, channels);
   }
   stream.internalColors = static_cast<uint8_t>(colors);
@@ -130,8 +137,9 @@ HdpEntry TakeEntry(ByteReader& bytes) {
 // The bytes of an entry of single bytes; empty when they do not lie in the file.
 std::span<const uint8_t> BytesOf(std::span<const uint8_t> file, const HdpEntry& entry) {
   const uint64_t offset = entry.count <= 4 ? entry.place : entry.value;
-  return offset <= file.size() && entry.count <= file.size() - offset ? file.subspan(offset, entry.count)
-                                                                      : std::span<const uint8_t>();
+  return offset <= file.size() && entry.count <= file.size() - offset
+             ? file.subspan(offset, entry.count)
+             : std::span<const uint8_t>();
 }
 
 // Places the reader at the directory of a page, behind its count; 0 when there is none.
@@ -151,7 +159,8 @@ struct Extent {
   uint32_t offset = 0, size = 0;
 };
 
-// What lies there, as far as the file goes: some writers give wrong sizes, and a decoder says itself what is missing.
+// What lies there, as far as the file goes: some writers give wrong sizes, and a decoder says
+// itself what is missing.
 std::span<const uint8_t> Part(std::span<const uint8_t> file, const Extent& extent) {
   if (extent.offset == 0 || extent.offset >= file.size()) return {};
   const auto rest = file.subspan(extent.offset);
@@ -164,7 +173,8 @@ Status ParseHdpStream(std::span<const uint8_t> data, HdpStream& stream) {
   ByteReader bytes(data);
   stream = {};
   stream.bytes = data;
-  if (!bytes.Match(std::string_view("WMPHOTO\0", 8))) return data.size() < 8 ? Status::FileReadError : Status::DamagedFile;
+  if (!bytes.Match(std::string_view("WMPHOTO\0", 8)))
+    return data.size() < 8 ? Status::FileReadError : Status::DamagedFile;
   BitReader bits(bytes);
   const uint32_t version = bits.Take(4), subversion = bits.Take(4);
   const bool tiled = bits.Flag();
@@ -186,13 +196,16 @@ Status ParseHdpStream(std::span<const uint8_t> data, HdpStream& stream) {
   const uint64_t height = uint64_t{bits.Take(shortNumbers ? 16 : 32)} + 1;
   const uint32_t columns = tiled ? bits.Take(12) + 1 : 1, rows = tiled ? bits.Take(12) + 1 : 1;
   if (!bytes.Ok()) return Status::FileReadError;
-  const bool known = version == 1 && (subversion == 0 || subversion == 1 || subversion == 9) && overlap < 3 && !stretched;
+  const bool known = version == 1 && (subversion == 0 || subversion == 1 || subversion == 9) &&
+                     overlap < 3 && !stretched;
   if (!known || !IsKnown(stream.colors, stream.depth)) return Status::UnsupportedFormat;
   if (width > INT32_MAX || height > INT32_MAX) return Status::DamagedFile;
   if (!indexed && (stream.frequencyOrder || columns * rows > 1)) return Status::DamagedFile;
   const unsigned sideBits = shortNumbers ? 8 : 16;
-  const bool fit = TakeTileSides(bits, columns, sideBits, static_cast<uint32_t>((width + kBlock - 1) / kBlock)) &&
-                   TakeTileSides(bits, rows, sideBits, static_cast<uint32_t>((height + kBlock - 1) / kBlock));
+  const bool fit =
+      TakeTileSides(bits, columns, sideBits,
+                    static_cast<uint32_t>((width + kBlock - 1) / kBlock)) &&
+      TakeTileSides(bits, rows, sideBits, static_cast<uint32_t>((height + kBlock - 1) / kBlock));
   if (window) bits.Take(24);
   bits.ToByte();
   stream.width = static_cast<int32_t>(width);
@@ -215,12 +228,14 @@ int32_t CountHdpPages(std::span<const uint8_t> file) {
   ByteReader bytes(file);
   if (!bytes.Match("II\xBC") || bytes.U8() > 1) return 0;
   int32_t pages = 0;
-  for (uint32_t offset = bytes.Le32(); offset != 0 && bytes.Ok() && pages < kMostHdpPages; ++pages) {
+  for (uint32_t offset = bytes.Le32(); offset != 0 && bytes.Ok() && pages < kMostHdpPages;
+       ++pages) {
     bytes.Seek(offset);
     const uint16_t count = bytes.Le16();
     bytes.Skip(count * kEntryBytes);
     const bool whole = bytes.Ok();
-    const uint32_t next = bytes.Left() >= 4 ? bytes.Le32() : 0;  // some writers leave the last link out
+    // some writers leave the last link out
+    const uint32_t next = bytes.Left() >= 4 ? bytes.Le32() : 0;
     if (!whole) break;
     offset = next > offset ? next : 0;  // links that lead back would never end
   }
@@ -230,7 +245,8 @@ int32_t CountHdpPages(std::span<const uint8_t> file) {
 Status ParseHdpPage(std::span<const uint8_t> file, int32_t page, HdpPage& result) {
   ByteReader bytes(file);
   result = {};
-  if (file.size() >= 4 && (std::memcmp(file.data(), "II\xBC", 3) != 0 || file[3] > 1)) return Status::DamagedFile;
+  if (file.size() >= 4 && (std::memcmp(file.data(), "II\xBC", 3) != 0 || file[3] > 1))
+    return Status::DamagedFile;
   const uint16_t count = FindDirectory(bytes, page);
   if (!bytes.Ok() || file.size() < 8) return Status::FileReadError;
   if (count == 0) return page == 0 ? Status::DamagedFile : Status::NoImages;
@@ -240,7 +256,8 @@ Status ParseHdpPage(std::span<const uint8_t> file, int32_t page, HdpPage& result
     const HdpEntry entry = TakeEntry(bytes);
     switch (entry.tag) {
       case kHdpPixelFormat:
-        if (const auto guid = BytesOf(file, entry); guid.size() == 16) std::memcpy(result.pixelFormat.data(), guid.data(), 16);
+        if (const auto guid = BytesOf(file, entry); guid.size() == 16)
+          std::memcpy(result.pixelFormat.data(), guid.data(), 16);
         break;
       case kHdpOrientation: result.turn = entry.value & 7; break;
       case kHdpDpiX: result.dpiX = std::bit_cast<float>(entry.value); break;
@@ -262,8 +279,9 @@ Status ParseHdpPage(std::span<const uint8_t> file, int32_t page, HdpPage& result
   RETURN_IF_BAD(ParseHdpStream(Part(file, image), result.image));
   if (alpha.offset == 0) return Status::Ok;
   RETURN_IF_BAD(ParseHdpStream(Part(file, alpha), result.alpha));
-  const bool matches = result.alpha.width == result.image.width && result.alpha.height == result.image.height &&
-                       result.alpha.depth == result.image.depth && result.alpha.colors == HdpColors::Gray;
+  const bool matches =
+      result.alpha.width == result.image.width && result.alpha.height == result.image.height &&
+      result.alpha.depth == result.image.depth && result.alpha.colors == HdpColors::Gray;
   return matches ? Status::Ok : Status::DamagedFile;
 }
 

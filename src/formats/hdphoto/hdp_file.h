@@ -49,11 +49,12 @@ struct HdpStream {
   uint8_t overlap = 0;          // 0 to 2: how far blocks are smoothed into each other
   uint32_t tiles = 1;
   bool lossless = false;       // every quantizer is 1
-  uint8_t internalColors = 0;  // how the colors are coded: 0 gray, 1 4:2:0, 2 4:2:2, 3 4:4:4, 4 CMYK, 6 any channels
+  // how the colors are coded: 0 gray, 1 4:2:0, 2 4:2:2, 3 4:4:4, 4 CMYK, 6 any channels
+  uint8_t internalColors = 0;
 };
 
-// Reads the head of a codestream and checks what a decoder would trust. FileReadError when it is cut short, DamagedFile
-// when it makes no sense.
+// Reads the head of a codestream and checks what a decoder would trust. FileReadError when it is
+// cut short, DamagedFile when it makes no sense.
 Status ParseHdpStream(std::span<const uint8_t> bytes, HdpStream& stream);
 
 // One picture of a file. The spans lie in the file.
@@ -62,7 +63,8 @@ struct HdpPage {
   HdpStream alpha;        // a codestream of its own, without bytes when there is none
   bool cutShort = false;  // the file ends before the codestreams do
   std::array<uint8_t, 16> pixelFormat{};
-  uint32_t turn = 0;  // 0 to 7: a quarter turn to the right (4), then columns (2) and rows (1) flipped
+  // 0 to 7: a quarter turn to the right (4), then columns (2) and rows (1) flipped
+  uint32_t turn = 0;
   float dpiX = 0, dpiY = 0;
   std::span<const uint8_t> icc, xmp, description;
   uint64_t directory = 0;  // where the page's own directory lies, which may lead to those of EXIF
@@ -77,19 +79,22 @@ inline constexpr int32_t kMostHdpPages = 4096;  // more are not read
 // The number of pages, 0 when the file is no HD Photo.
 int32_t CountHdpPages(std::span<const uint8_t> file);
 
-// Reads the directory of a page, from 0, and its codestreams' heads. NoImages when there is no such page; else as
-// above.
+// Reads the directory of a page, from 0, and its codestreams' heads. NoImages when there is no such
+// page; else as above.
 Status ParseHdpPage(std::span<const uint8_t> file, int32_t page, HdpPage& result);
 
-// The EXIF block of a page that was parsed: what a camera's directories say, and the turn as orientation. Empty when there
-// is nothing to say.
+// The EXIF block of a page that was parsed: what a camera's directories say, and the turn as
+// orientation. Empty when there is nothing to say.
 std::vector<uint8_t> HdpExifBlock(std::span<const uint8_t> file, const HdpPage& page);
 
 // The entries of a directory that both reader and writer know.
-inline constexpr uint16_t kHdpDescription = 270, kHdpXmp = 700, kHdpIcc = 34675, kHdpExif = 34665, kHdpGps = 34853;
-inline constexpr uint16_t kHdpPixelFormat = 0xBC01, kHdpOrientation = 0xBC02, kHdpWidth = 0xBC80, kHdpHeight = 0xBC81,
-                          kHdpDpiX = 0xBC82, kHdpDpiY = 0xBC83, kHdpImageOffset = 0xBCC0, kHdpImageSize = 0xBCC1,
+inline constexpr uint16_t kHdpDescription = 270, kHdpXmp = 700, kHdpIcc = 34675, kHdpExif = 34665,
+                          kHdpGps = 34853;
+inline constexpr uint16_t kHdpPixelFormat = 0xBC01, kHdpOrientation = 0xBC02, kHdpWidth = 0xBC80,
+                          kHdpHeight = 0xBC81, kHdpDpiX = 0xBC82, kHdpDpiY = 0xBC83,
+                          kHdpImageOffset = 0xBCC0, kHdpImageSize = 0xBCC1,
                           kHdpAlphaOffset = 0xBCC2, kHdpAlphaSize = 0xBCC3;
-inline constexpr uint16_t kHdpByte = 1, kHdpText = 2, kHdpLong = 4, kHdpUndefined = 7, kHdpFloat = 11;
+inline constexpr uint16_t kHdpByte = 1, kHdpText = 2, kHdpLong = 4, kHdpUndefined = 7,
+                          kHdpFloat = 11;
 
 }  // namespace fotomill

@@ -1,6 +1,7 @@
-// The HD Photo writer: one page, its directory in front. Grays of 8 bits stay gray, everything else becomes 24-bit RGB,
-// coded 4:4:4 with the quantizer HDPCompression (0 loses nothing). HDPWriteOptions with bit 0 set puts the picture into
-// the order of frequencies: coarse values of all of it first. Resolution is the picture's, else TiffResolution.
+// The HD Photo writer: one page, its directory in front. Grays of 8 bits stay gray, everything else
+// becomes 24-bit RGB, coded 4:4:4 with the quantizer HDPCompression (0 loses nothing).
+// HDPWriteOptions with bit 0 set puts the picture into the order of frequencies: coarse values of
+// all of it first. Resolution is the picture's, else TiffResolution.
 #include <algorithm>
 #include <bit>
 #include <vector>
@@ -20,7 +21,8 @@ constexpr uint32_t kPixelFormatPlace = 8, kExifPlace = kPixelFormatPlace + 16;
 constexpr uint32_t kInFrequencyOrder = 1;  // of HDPWriteOptions
 
 // Pixel formats 8-bit gray and 24-bit blue, green, red: one name with a number at its end.
-constexpr uint8_t kPixelFormat[15] = {0x24, 0xC3, 0xDD, 0x6F, 0x03, 0x4E, 0xFE, 0x4B, 0xB1, 0x85, 0x3D, 0x77, 0x76, 0x8D, 0xC9};
+constexpr uint8_t kPixelFormat[15] = {0x24, 0xC3, 0xDD, 0x6F, 0x03, 0x4E, 0xFE, 0x4B,
+                                      0xB1, 0x85, 0x3D, 0x77, 0x76, 0x8D, 0xC9};
 constexpr uint8_t kGray8 = 0x08, kBgr24 = 0x0C;
 
 // The file's directory, with blocks behind it, each at an even place.
@@ -32,10 +34,12 @@ class Directory {
     entries_.push_back({tag, type, count, offset, {}});
   }
   void Block(uint16_t tag, uint16_t type, std::span<const uint8_t> block) {
-    if (!block.empty()) entries_.push_back({tag, type, static_cast<uint32_t>(block.size()), 0, block});
+    if (!block.empty())
+      entries_.push_back({tag, type, static_cast<uint32_t>(block.size()), 0, block});
   }
   void Write(ByteWriter& out) {
-    std::sort(entries_.begin(), entries_.end(), [](const Entry& a, const Entry& b) { return a.tag < b.tag; });
+    std::sort(entries_.begin(), entries_.end(),
+              [](const Entry& a, const Entry& b) { return a.tag < b.tag; });
     out.Le16(static_cast<uint16_t>(entries_.size()));
     uint64_t at = out.Position() + 12 * entries_.size() + 4;
     for (Entry& entry : entries_) {
@@ -47,7 +51,8 @@ class Directory {
       uint32_t value = entry.block.empty() ? entry.value : static_cast<uint32_t>(at);
       if (!entry.block.empty() && inside) {
         value = 0;
-        for (size_t i = 0; i < entry.block.size(); ++i) value |= static_cast<uint32_t>(entry.block[i]) << (8 * i);
+        for (size_t i = 0; i < entry.block.size(); ++i)
+          value |= static_cast<uint32_t>(entry.block[i]) << (8 * i);
       }
       out.Le32(value);
       at += Padded(entry.block.size());
@@ -61,7 +66,9 @@ class Directory {
   }
   // Where the value of a written entry lies in the file, for those that are known only later.
   uint64_t PlaceOf(uint16_t tag) const {
-    return std::find_if(entries_.begin(), entries_.end(), [tag](const Entry& entry) { return entry.tag == tag; })->place;
+    return std::find_if(entries_.begin(), entries_.end(),
+                        [tag](const Entry& entry) { return entry.tag == tag; })
+        ->place;
   }
 
  private:
@@ -95,17 +102,20 @@ Status MakeSource(const PictureRecord& picture, bool gray, PackedImage& source) 
   return Status::Ok;
 }
 
-// What of a picture's EXIF goes into the file's own directory beside the pointers: texts on who, when and with what.
+// What of a picture's EXIF goes into the file's own directory beside the pointers: texts on who,
+// when and with what.
 struct HdpMetadata {
   ExifDirectories exif;
   PlacedExif placed;
   std::vector<uint8_t> comment;  // with a zero behind it
 };
 
-Directory MakeDirectory(const PictureRecord& picture, const WriteOptions& options, const HdpMetadata& extra) {
+Directory MakeDirectory(const PictureRecord& picture, const WriteOptions& options,
+                        const HdpMetadata& extra) {
   const PictureMetadata& metadata = picture.metadata;
   const auto dpi = [&](double value) {
-    return std::bit_cast<uint32_t>(static_cast<float>(value > 0 ? value : options.encode.resolution));
+    return std::bit_cast<uint32_t>(
+        static_cast<float>(value > 0 ? value : options.encode.resolution));
   };
   Directory directory;
   directory.Value(kHdpWidth, kHdpLong, static_cast<uint32_t>(picture.image.Width()));
@@ -139,9 +149,12 @@ Status WriteAll(ByteWriter& out, PictureRecord& picture, const WriteOptions& opt
   // The EXIF directories stand in front, where their place is known, then the file's own.
   HdpMetadata extra;
   if (keep) extra.exif = ParseExifBlock(picture.metadata.exif);
-  if (keep && extra.exif.Empty() && !picture.metadata.exif.empty()) picture.lostMetadata |= kLostExif;
-  for (ExifEntry& entry : extra.exif.first) {  // cameras leave out the zero that ends a text; other readers insist on it
-    if (entry.type == kHdpText && (entry.value.empty() || entry.value.back() != 0)) entry.value.push_back(0);
+  if (keep && extra.exif.Empty() && !picture.metadata.exif.empty())
+    picture.lostMetadata |= kLostExif;
+  // cameras leave out the zero that ends a text; other readers insist on it
+  for (ExifEntry& entry : extra.exif.first) {
+    if (entry.type == kHdpText && (entry.value.empty() || entry.value.back() != 0))
+      entry.value.push_back(0);
   }
   if (!picture.comment.empty()) {
     extra.comment = picture.comment;

@@ -18,12 +18,13 @@ constexpr FormatSetting kKeys[] = {
 constexpr FormatSettings kSettings = {"HDP", "OverrideHdpBox", TrLater("HD Photo"), kKeys};
 
 std::string JxrVersion() { return HdpWorksHere() ? "present" : "missing"; }
-constexpr FormatLibrary kLibraries[] = {{"libjxr", JxrVersion, TrLater("HD Photo, loaded when needed")}};
+constexpr FormatLibrary kLibraries[] = {
+    {"libjxr", JxrVersion, TrLater("HD Photo, loaded when needed")}};
 
 constexpr uint32_t kFlags = FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_FRAMES | FMT_LAYERED;
 
-constexpr FormatEntry Row(std::string_view extension, std::string_view description, uint32_t flags, DetailsOperation details,
-                          bool hasOptionsBox) {
+constexpr FormatEntry Row(std::string_view extension, std::string_view description, uint32_t flags,
+                          DetailsOperation details, bool hasOptionsBox) {
   return {.details = details,
           .info = HdpInfo,
           .read = HdpRead,

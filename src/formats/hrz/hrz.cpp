@@ -1,8 +1,9 @@
-// Slow-scan television frames (HRZ): 256 x 240 pixels from the top, red, green, blue, of 6 bits in a byte each; nothing
-// else, so that a file is known by its size alone.
+// Slow-scan television frames (HRZ): 256 x 240 pixels from the top, red, green, blue, of 6 bits in
+// a byte each; nothing else, so that a file is known by its size alone.
 //
-// The reader takes bytes whose upper bits are set by their lower six. The writer drops the lower two bits of each color.
-// Source: the format has no official description; "HRZ" in the Just Solve the File Format Problem wiki (Archive Team).
+// The reader takes bytes whose upper bits are set by their lower six. The writer drops the lower
+// two bits of each color. Source: the format has no official description; "HRZ" in the Just Solve
+// the File Format Problem wiki (Archive Team).
 #include "formats/hrz/hrz.h"
 
 #include <array>
@@ -27,7 +28,8 @@ constexpr uint8_t Widened(uint8_t level) {
 Status DescribePicture(const platform::FileView& file, PictureRecord& picture) {
   picture.typeName.Clear();
   picture.fileSize = file.FileSize();
-  if (file.FileSize() != kFileSize) return file.FileSize() < kFileSize ? Status::FileReadError : Status::DamagedFile;
+  if (file.FileSize() != kFileSize)
+    return file.FileSize() < kFileSize ? Status::FileReadError : Status::DamagedFile;
   picture.width = kWidth;
   picture.height = kHeight;
   picture.bitsPerPixel = 24;
@@ -72,7 +74,8 @@ Status HrzRead(PictureRecord& picture, const ReadRequest& request) {
 Status HrzWrite(PictureRecord& picture, const WriteOptions& options) {
   const ProgressScope progress(picture);
   if (picture.image.Empty()) return Status::MemoryAllocationError;
-  if (picture.image.Width() != kWidth || picture.image.Height() != kHeight) return Status::UnsuitableImage;
+  if (picture.image.Width() != kWidth || picture.image.Height() != kHeight)
+    return Status::UnsuitableImage;
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
   BgrRows rows;

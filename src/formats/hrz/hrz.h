@@ -6,11 +6,12 @@
 
 namespace fotomill {
 
-// Slow-scan television frames, always 256 x 240 pixels. Statuses: FileOpenError (1), DamagedFile (2) for a file of another
-// size, FileReadError (3) for a shorter one, MemoryAllocationError (6).
+// Slow-scan television frames, always 256 x 240 pixels. Statuses: FileOpenError (1), DamagedFile
+// (2) for a file of another size, FileReadError (3) for a shorter one, MemoryAllocationError (6).
 Status HrzInfo(PictureRecord& picture, const ReadRequest& request);
 Status HrzRead(PictureRecord& picture, const ReadRequest& request);
-// Also UnsuitableImage (13) for pictures of another size, ErrorCreatingFile (10), ErrorWritingFile (11).
+// Also UnsuitableImage (13) for pictures of another size, ErrorCreatingFile (10), ErrorWritingFile
+// (11).
 Status HrzWrite(PictureRecord& picture, const WriteOptions& options);
 
 }  // namespace fotomill

@@ -11,18 +11,20 @@
 //       +8    4  bytes of the entry's picture
 //      +12    4  its offset
 //
-// A picture is a whole PNG file, or a bitmap without file header: a 40-byte information header whose height counts both of
-// the following bitmaps, the palette of blue, green, red, 0, the colors at 1, 4, 8, 16, 24 or 32 bits, then the AND mask
-// at 1 bit (set: transparent). Rows run from the bottom up, each padded to 4 bytes.
+// A picture is a whole PNG file, or a bitmap without file header: a 40-byte information header
+// whose height counts both of the following bitmaps, the palette of blue, green, red, 0, the colors
+// at 1, 4, 8, 16, 24 or 32 bits, then the AND mask at 1 bit (set: transparent). Rows run from the
+// bottom up, each padded to 4 bytes.
 //
-// The reader takes the largest entry, among equals the deepest, by what the pictures themselves say: the numbers in the
-// entries are often wrong. A bitmap of up to 8 bits without a transparent pixel keeps its palette; everything else becomes
-// 24 bits with an alpha plane. The fourth byte of 32-bit pixels is alpha unless it is 0 everywhere, as old programs left
-// it; then the mask counts. A mask that the file lacks is opaque.
+// The reader takes the largest entry, among equals the deepest, by what the pictures themselves
+// say: the numbers in the entries are often wrong. A bitmap of up to 8 bits without a transparent
+// pixel keeps its palette; everything else becomes 24 bits with an alpha plane. The fourth byte of
+// 32-bit pixels is alpha unless it is 0 everywhere, as old programs left it; then the mask counts.
+// A mask that the file lacks is opaque.
 //
-// The writer stores one bitmap with its mask; 24 bits with an alpha plane as 32. ICOCompression asks for a PNG file
-// instead, for 256 x 256 pixels or for every size.
-// Source: Microsoft, "Icons in Win32" (J. Hornick, 1995); "The evolution of the ICO file format" (R. Chen, 2010).
+// The writer stores one bitmap with its mask; 24 bits with an alpha plane as 32. ICOCompression
+// asks for a PNG file instead, for 256 x 256 pixels or for every size. Source: Microsoft, "Icons in
+// Win32" (J. Hornick, 1995); "The evolution of the ICO file format" (R. Chen, 2010).
 #include "formats/icon/ico.h"
 
 #include <algorithm>
@@ -62,14 +64,16 @@ struct IcoFile {
 Status ParseDirectory(std::span<const uint8_t> file, IcoFile& icons) {
   ByteReader bytes(file);
   const uint16_t reserved = bytes.Le16(), type = bytes.Le16(), count = bytes.Le16();
-  if (!bytes.Ok() || reserved != 0 || (type != kIcons && type != kCursors)) return Status::DamagedFile;
+  if (!bytes.Ok() || reserved != 0 || (type != kIcons && type != kCursors))
+    return Status::DamagedFile;
   icons.cursors = type == kCursors;
   for (uint16_t i = 0; i < count; ++i) {
     bytes.Skip(4);
     IcoEntry entry;
     entry.hotSpotX = bytes.Le16();
     entry.hotSpotY = bytes.Le16();
-    entry.claimedBits = icons.cursors || entry.hotSpotY == 0 || entry.hotSpotY > 32 ? uint16_t{32} : entry.hotSpotY;
+    entry.claimedBits =
+        icons.cursors || entry.hotSpotY == 0 || entry.hotSpotY > 32 ? uint16_t{32} : entry.hotSpotY;
     bytes.Skip(4);  // the size is often wrong; the picture itself knows better
     const uint64_t offset = bytes.Le32();
     if (!bytes.Ok()) return Status::FileReadError;
@@ -88,16 +92,20 @@ struct IcoBitmap {
   std::span<const uint8_t> palette, colors, mask;  // mask: empty when the file lacks it
 
   uint64_t Stride() const { return RowStride(width, bits); }
-  std::span<const uint8_t> Row(int32_t r) const { return colors.subspan(static_cast<uint64_t>(r) * Stride(), Stride()); }
+  std::span<const uint8_t> Row(int32_t r) const {
+    return colors.subspan(static_cast<uint64_t>(r) * Stride(), Stride());
+  }
   // Whether the mask makes the pixel in stored row r transparent.
   bool Masked(int32_t x, int32_t r) const {
     if (mask.empty()) return false;
-    const uint64_t place = static_cast<uint64_t>(r) * RowStride(width, 1) + static_cast<uint64_t>(x) / 8;
+    const uint64_t place =
+        static_cast<uint64_t>(r) * RowStride(width, 1) + static_cast<uint64_t>(x) / 8;
     return (mask[place] >> (7 - x % 8) & 1) != 0;
   }
 };
 
-// Ok; DamagedFile for a header that makes no sense, UnsupportedFormat for compression, FileReadError for missing colors.
+// Ok; DamagedFile for a header that makes no sense, UnsupportedFormat for compression,
+// FileReadError for missing colors.
 Status ParseBitmap(std::span<const uint8_t> entry, IcoBitmap& bitmap) {
   ByteReader bytes(entry);
   const uint32_t infoSize = bytes.Le32();
@@ -116,8 +124,10 @@ Status ParseBitmap(std::span<const uint8_t> entry, IcoBitmap& bitmap) {
   if (bitmap.compression != 0) return Status::UnsupportedFormat;
   const uint32_t most = bitmap.bits <= 8 ? 1u << bitmap.bits : 0;
   bytes.Seek(infoSize);
-  bitmap.palette = bytes.Take(uint64_t{4} * (colorsUsed == 0 || colorsUsed > most ? most : colorsUsed));
-  if (bytes.Left() / bitmap.Stride() < static_cast<uint64_t>(bitmap.height)) return Status::FileReadError;
+  bitmap.palette =
+      bytes.Take(uint64_t{4} * (colorsUsed == 0 || colorsUsed > most ? most : colorsUsed));
+  if (bytes.Left() / bitmap.Stride() < static_cast<uint64_t>(bitmap.height))
+    return Status::FileReadError;
   bitmap.colors = bytes.Take(bitmap.Stride() * static_cast<uint64_t>(bitmap.height));
   const uint64_t maskSize = RowStride(bitmap.width, 1) * static_cast<uint64_t>(bitmap.height);
   if (bytes.Left() >= maskSize) bitmap.mask = bytes.Take(maskSize);
@@ -126,7 +136,8 @@ Status ParseBitmap(std::span<const uint8_t> entry, IcoBitmap& bitmap) {
 
 bool IsPng(std::span<const uint8_t> entry) {
   constexpr uint8_t kPngSignature[] = {0x89, 'P', 'N', 'G', '\r', '\n', 0x1A, '\n'};
-  return entry.size() > 24 && std::equal(std::begin(kPngSignature), std::end(kPngSignature), entry.begin());
+  return entry.size() > 24 &&
+         std::equal(std::begin(kPngSignature), std::end(kPngSignature), entry.begin());
 }
 
 // How good an entry is: its area first, then its depth; 0 for one that cannot be read.
@@ -139,13 +150,16 @@ uint64_t Rank(const IcoEntry& entry) {
   }
   IcoBitmap bitmap;
   if (ParseBitmap(entry.bytes, bitmap) != Status::Ok) return 0;
-  return static_cast<uint64_t>(bitmap.width) * static_cast<uint64_t>(bitmap.height) * 64 + bitmap.bits;
+  return static_cast<uint64_t>(bitmap.width) * static_cast<uint64_t>(bitmap.height) * 64 +
+         bitmap.bits;
 }
 
 // Entry number `page` from the best one down; null beyond the last.
 const IcoEntry* ChooseEntry(IcoFile& icons, int32_t page) {
   std::ranges::stable_sort(icons.entries, std::greater(), Rank);
-  return static_cast<size_t>(page) < icons.entries.size() ? &icons.entries[static_cast<size_t>(page)] : nullptr;
+  return static_cast<size_t>(page) < icons.entries.size()
+             ? &icons.entries[static_cast<size_t>(page)]
+             : nullptr;
 }
 
 bool AnyMasked(const IcoBitmap& bitmap) {
@@ -173,7 +187,8 @@ void DescribeBitmap(const IcoBitmap& bitmap, PictureRecord& picture) {
   picture.width = bitmap.width;
   picture.height = bitmap.height;
   picture.bitsPerPixel = alpha || bitmap.bits > 8 ? 24 : bitmap.bits;
-  picture.alphaFlags = static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (alpha ? kHasAlpha : 0));
+  picture.alphaFlags =
+      static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (alpha ? kHasAlpha : 0));
   if (picture.bitsPerPixel == 24) {
     MakeDefaultPalette(&picture.palette, nullptr, kDisplayPalette);
     return;
@@ -205,21 +220,26 @@ void ColorAt(const IcoBitmap& bitmap, std::span<const uint8_t> row, size_t x, ui
   }
 }
 
-Status ReadBitmap(const IcoBitmap& bitmap, PictureRecord& picture, PackedImage& image, PackedImage& alpha) {
+Status ReadBitmap(const IcoBitmap& bitmap, PictureRecord& picture, PackedImage& image,
+                  PackedImage& alpha) {
   RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette, picture.bitsPerPixel, image));
   const bool alphaBytes = HasAlphaBytes(bitmap);
-  if ((picture.alphaFlags & kHasAlpha) != 0) RETURN_IF_BAD(NewAlphaPlane(picture.width, picture.height, alpha));
+  if ((picture.alphaFlags & kHasAlpha) != 0)
+    RETURN_IF_BAD(NewAlphaPlane(picture.width, picture.height, alpha));
   for (int32_t r = 0; r < bitmap.height; ++r) {
     const auto source = bitmap.Row(r);
     const auto row = image.StoredRow(r);
     if (image.Bits() == bitmap.bits) {
       std::copy(source.begin(), source.end(), row.begin());
     } else {
-      for (size_t x = 0; x < static_cast<size_t>(bitmap.width); ++x) ColorAt(bitmap, source, x, &row[3 * x]);
+      for (size_t x = 0; x < static_cast<size_t>(bitmap.width); ++x)
+        ColorAt(bitmap, source, x, &row[3 * x]);
     }
     for (int32_t x = 0; x < bitmap.width && !alpha.Empty(); ++x) {
       const auto column = static_cast<size_t>(x);
-      alpha.StoredRow(r)[column] = alphaBytes ? source[4 * column + 3] : bitmap.Masked(x, r) ? 0 : 255;
+      alpha.StoredRow(r)[column] = alphaBytes            ? source[4 * column + 3]
+                                   : bitmap.Masked(x, r) ? 0
+                                                         : 255;
     }
     RETURN_IF_BAD(picture.ReportRow(r));
   }
@@ -227,11 +247,12 @@ Status ReadBitmap(const IcoBitmap& bitmap, PictureRecord& picture, PackedImage& 
 }
 
 // A PNG entry is a whole file of its own; the names and pages of the icon stay.
-Status LoadPngEntry(std::span<const uint8_t> entry, const ReadOptions& options, PictureRecord& picture, PackedImage* image,
-                    PackedImage* alpha) {
+Status LoadPngEntry(std::span<const uint8_t> entry, const ReadOptions& options,
+                    PictureRecord& picture, PackedImage* image, PackedImage* alpha) {
   const FixedText<64> typeName = picture.typeName;
   const int32_t pages = picture.pageCount;
-  const Status status = image == nullptr ? DescribePng(entry, options, picture) : DecodePng(entry, options, picture);
+  const Status status =
+      image == nullptr ? DescribePng(entry, options, picture) : DecodePng(entry, options, picture);
   picture.typeName = typeName;
   picture.pageCount = pages;
   RETURN_IF_BAD(status);
@@ -243,14 +264,16 @@ Status LoadPngEntry(std::span<const uint8_t> entry, const ReadOptions& options, 
 }
 
 // Facts, and with `image` the pixels, of the entry that the request's page selects.
-Status LoadEntry(IcoFile& icons, const ReadRequest& request, PictureRecord& picture, PackedImage* image, PackedImage* alpha) {
+Status LoadEntry(IcoFile& icons, const ReadRequest& request, PictureRecord& picture,
+                 PackedImage* image, PackedImage* alpha) {
   const IcoEntry* entry = ChooseEntry(icons, request.page);
   if (entry == nullptr) return Status::NoImages;
   picture.typeName.AssignCut(icons.cursors ? "Windows cursor" : "Windows icon");
   picture.pageCount = static_cast<int32_t>(icons.entries.size());
   picture.hotSpotX = icons.cursors ? entry->hotSpotX : 0;
   picture.hotSpotY = icons.cursors ? entry->hotSpotY : 0;
-  if (IsPng(entry->bytes)) return LoadPngEntry(entry->bytes, request.options, picture, image, alpha);
+  if (IsPng(entry->bytes))
+    return LoadPngEntry(entry->bytes, request.options, picture, image, alpha);
   IcoBitmap bitmap;
   RETURN_IF_BAD(ParseBitmap(entry->bytes, bitmap));
   DescribeBitmap(bitmap, picture);
@@ -274,11 +297,14 @@ IcoLayout ChooseLayout(const PictureRecord& picture, int32_t compression) {
   IcoLayout layout;
   layout.bits = image.Bits() == 24 && !picture.alpha.Empty() ? 32 : image.Bits();
   layout.colors = static_cast<uint32_t>(image.Colors());
-  layout.colorBytes = static_cast<uint32_t>(RowStride(image.Width(), layout.bits)) * static_cast<uint32_t>(image.Height());
-  layout.maskBytes = static_cast<uint32_t>(RowStride(image.Width(), 1)) * static_cast<uint32_t>(image.Height());
+  layout.colorBytes = static_cast<uint32_t>(RowStride(image.Width(), layout.bits)) *
+                      static_cast<uint32_t>(image.Height());
+  layout.maskBytes =
+      static_cast<uint32_t>(RowStride(image.Width(), 1)) * static_cast<uint32_t>(image.Height());
   layout.cursor = EqualIgnoringCase(platform::ExtensionOf(picture.fileName), "cur");
   const bool fullSize = image.Width() == kMostSide && image.Height() == kMostSide;
-  layout.png = compression == choice::kIconPngAlways || (compression == choice::kIconPng256 && fullSize);
+  layout.png =
+      compression == choice::kIconPngAlways || (compression == choice::kIconPng256 && fullSize);
   return layout;
 }
 
@@ -337,7 +363,8 @@ void WriteMask(ByteWriter& out, const PictureRecord& picture) {
   std::vector<uint8_t> mask(RowStride(picture.image.Width(), 1));
   for (int32_t r = 0; r < picture.image.Height(); ++r) {
     std::ranges::fill(mask, uint8_t{0});
-    for (size_t x = 0; x < static_cast<size_t>(picture.image.Width()) && !picture.alpha.Empty(); ++x) {
+    for (size_t x = 0; x < static_cast<size_t>(picture.image.Width()) && !picture.alpha.Empty();
+         ++x) {
       if (picture.alpha.StoredRow(r)[x] < 128) mask[x / 8] |= static_cast<uint8_t>(0x80 >> x % 8);
     }
     out.Bytes(mask);
@@ -375,14 +402,16 @@ Status IcoRead(PictureRecord& picture, const ReadRequest& request) {
 Status IcoWrite(PictureRecord& picture, const WriteOptions& options) {
   const ProgressScope progress(picture);
   if (picture.image.Empty()) return Status::MemoryAllocationError;
-  if (picture.image.Width() > kMostSide || picture.image.Height() > kMostSide) return Status::UnsuitableImage;
+  if (picture.image.Width() > kMostSide || picture.image.Height() > kMostSide)
+    return Status::UnsuitableImage;
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
   const IcoLayout layout = ChooseLayout(picture, options.encode.iconCompression);
   WriteDirectory(out, picture, layout);
   if (layout.png) {
     RETURN_IF_BAD(EncodePng(picture, options.encode, out));
-    out.PatchLe32(kSizeOffset, static_cast<uint32_t>(out.Position()) - kFileHeaderSize - kEntrySize);
+    out.PatchLe32(kSizeOffset,
+                  static_cast<uint32_t>(out.Position()) - kFileHeaderSize - kEntrySize);
   } else {
     WriteBitmapHeader(out, picture, layout);
     RETURN_IF_BAD(WriteColors(out, picture, layout));

@@ -6,12 +6,14 @@
 
 namespace fotomill {
 
-// Windows icons and cursors. `page` of the request counts the entries from the best one, 0, down. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when an entry is cut short,
-// MemoryAllocationError (6), UnsupportedFormat (8) for a compressed bitmap, NoImages (20) for an empty file.
+// Windows icons and cursors. `page` of the request counts the entries from the best one, 0, down.
+// Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when an entry is cut short,
+// MemoryAllocationError (6), UnsupportedFormat (8) for a compressed bitmap, NoImages (20) for an
+// empty file.
 Status IcoInfo(PictureRecord& picture, const ReadRequest& request);
 Status IcoRead(PictureRecord& picture, const ReadRequest& request);
-// Writes one entry; a cursor when the extension is "cur". Also UnsuitableImage (13) for sides over 256,
-// ErrorCreatingFile (10), ErrorWritingFile (11).
+// Writes one entry; a cursor when the extension is "cur". Also UnsuitableImage (13) for sides over
+// 256, ErrorCreatingFile (10), ErrorWritingFile (11).
 Status IcoWrite(PictureRecord& picture, const WriteOptions& options);
 
 }  // namespace fotomill

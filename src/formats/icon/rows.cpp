@@ -36,8 +36,11 @@ constexpr FormatEntry Row(std::string_view extension, std::string_view descripti
 
 constexpr FormatEntry kRows[] = {
     Row("ICO", "(ICO) Windows icon",
-        FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_CONTAINER | FMT_LAYERED | FMT_TRANSPARENT | FMT_ALPHA, kIconSignatures, true),
-    Row("CUR", "(CUR) Windows cursor", FMT_BITMAP | FMT_SECONDARY | FMT_ALPHA, kCursorSignatures, false),
+        FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_CONTAINER | FMT_LAYERED | FMT_TRANSPARENT |
+            FMT_ALPHA,
+        kIconSignatures, true),
+    Row("CUR", "(CUR) Windows cursor", FMT_BITMAP | FMT_SECONDARY | FMT_ALPHA, kCursorSignatures,
+        false),
 };
 
 }  // namespace

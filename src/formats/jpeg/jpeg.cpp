@@ -1,20 +1,22 @@
 // JPEG (JFIF, Exif), big-endian, decoded and encoded by libjpeg.
 //
 //   FF D8, then segments of FF, a marker byte, a length (2 bytes, itself included) and data:
-//   E0 "JFIF" resolution      E1 "Exif\0\0" EXIF, "http://ns.adobe.com/xap/1.0/\0" XMP      E2 "ICC_PROFILE\0" n of m
-//   EE "Adobe" color transform      FE comment      DB, C4 tables      C0-CF frame      DA scan and its data      D9 end
+//   E0 "JFIF" resolution      E1 "Exif\0\0" EXIF, "http://ns.adobe.com/xap/1.0/\0" XMP      E2
+//   "ICC_PROFILE\0" n of m EE "Adobe" color transform      FE comment      DB, C4 tables      C0-CF
+//   frame      DA scan and its data      D9 end
 //
-// Gray pictures become 8 bits with a gray palette, all others 24 bits. CMYK and YCCK are turned into RGB by the usual
-// formula, with the inverted values that Adobe's programs store. EXIF, XMP, ICC profile, comment and resolution travel with
-// the picture; its orientation is not applied here.
+// Gray pictures become 8 bits with a gray palette, all others 24 bits. CMYK and YCCK are turned
+// into RGB by the usual formula, with the inverted values that Adobe's programs store. EXIF, XMP,
+// ICC profile, comment and resolution travel with the picture; its orientation is not applied here.
 //
-// Broken data: a file that ends before its last pixel fails (status 3). A fault inside the data that the decoder can pass
-// over is told in the record's `warning`, and the picture is shown with it; a missing end marker is no fault.
+// Broken data: a file that ends before its last pixel fails (status 3). A fault inside the data
+// that the decoder can pass over is told in the record's `warning`, and the picture is shown with
+// it; a missing end marker is no fault.
 //
-// The writer makes baseline or progressive files (WriteJpegProgressive) of quality JpegCompression and chroma sampling
-// JpegSubsample. Grays stay gray; other palettes are promoted. JpegStoreDPI stores a resolution: the picture's, else
-// TiffResolution.
-// Source: ITU-T T.81 (1992) and T.871 (2011); Adobe Technical Note 5116; XMP specification part 3; ICC.1:2022, annex B.4.
+// The writer makes baseline or progressive files (WriteJpegProgressive) of quality JpegCompression
+// and chroma sampling JpegSubsample. Grays stay gray; other palettes are promoted. JpegStoreDPI
+// stores a resolution: the picture's, else TiffResolution. Source: ITU-T T.81 (1992) and T.871
+// (2011); Adobe Technical Note 5116; XMP specification part 3; ICC.1:2022, annex B.4.
 #include "formats/jpeg/jpeg.h"
 
 #include <algorithm>
@@ -41,14 +43,18 @@ constexpr std::string_view kIccHead("ICC_PROFILE\0", 12);
 constexpr int kApp1 = JPEG_APP0 + 1, kApp2 = JPEG_APP0 + 2;
 
 bool IsGray(const jpeg_decompress_struct& info) { return info.jpeg_color_space == JCS_GRAYSCALE; }
-bool IsCmyk(const jpeg_decompress_struct& info) { return info.jpeg_color_space == JCS_CMYK || info.jpeg_color_space == JCS_YCCK; }
+bool IsCmyk(const jpeg_decompress_struct& info) {
+  return info.jpeg_color_space == JCS_CMYK || info.jpeg_color_space == JCS_YCCK;
+}
 
 std::string_view DataOf(const JpegSegment& segment) {
-  return {static_cast<const char*>(static_cast<const void*>(segment.data.data())), segment.data.size()};
+  return {static_cast<const char*>(static_cast<const void*>(segment.data.data())),
+          segment.data.size()};
 }
 
 void Append(std::vector<uint8_t>& block, std::string_view data) {
-  if (block.size() + data.size() <= limits.metadataBytes) block.insert(block.end(), data.begin(), data.end());
+  if (block.size() + data.size() <= limits.metadataBytes)
+    block.insert(block.end(), data.begin(), data.end());
 }
 
 // The profile's pieces may come in any order; each names its number from 1 and how many there are.
@@ -102,19 +108,22 @@ Status DescribePicture(const JpegReader& reader, PictureRecord& picture) {
   return picture.width < 1 || picture.height < 1 ? Status::DamagedFile : Status::Ok;
 }
 
-// Sets what comes out: colors, and the smallest size in eighths whose longer edge is still twice the side asked for.
+// Sets what comes out: colors, and the smallest size in eighths whose longer edge is still twice
+// the side asked for.
 void SetOutput(jpeg_decompress_struct& info, int32_t thumbnailSide) {
   info.out_color_space = IsGray(info) ? JCS_GRAYSCALE : IsCmyk(info) ? JCS_CMYK : JCS_EXT_BGR;
   info.scale_denom = 8;
   info.scale_num = 8;
   const auto longer = static_cast<int64_t>(std::max(info.image_width, info.image_height));
   for (const unsigned eighths : {4u, 2u, 1u}) {
-    if (thumbnailSide > 0 && longer * eighths / 8 >= 2 * int64_t{thumbnailSide}) info.scale_num = eighths;
+    if (thumbnailSide > 0 && longer * eighths / 8 >= 2 * int64_t{thumbnailSide})
+      info.scale_num = eighths;
   }
   jpeg_calc_output_dimensions(&info);
 }
 
-// Ink to light. 255 stands for no ink: so Adobe's programs store it, and files without their marker are read like theirs.
+// Ink to light. 255 stands for no ink: so Adobe's programs store it, and files without their marker
+// are read like theirs.
 void CmykToBgr(const uint8_t* ink, uint8_t* color, size_t width) {
   for (size_t x = 0; x < width; ++x, ink += 4, color += 3) {
     for (size_t i = 0; i < 3; ++i) {
@@ -172,7 +181,8 @@ boolean TakeFullBuffer(j_compress_ptr info) {
   return TRUE;
 }
 void TakeLastBuffer(j_compress_ptr info) {
-  static_cast<ByteWriter*>(info->client_data)->Used(ByteWriter::kMostReserved - info->dest->free_in_buffer);
+  static_cast<ByteWriter*>(info->client_data)
+      ->Used(ByteWriter::kMostReserved - info->dest->free_in_buffer);
 }
 
 void SetSampling(jpeg_compress_struct& info, int32_t choice) {
@@ -182,13 +192,16 @@ void SetSampling(jpeg_compress_struct& info, int32_t choice) {
 }
 
 void SetResolution(jpeg_compress_struct& info, const PictureMetadata& metadata, int32_t otherwise) {
-  const auto clamp = [](double dpi) { return static_cast<UINT16>(std::clamp<long>(std::lround(dpi), 1, 65535)); };
+  const auto clamp = [](double dpi) {
+    return static_cast<UINT16>(std::clamp<long>(std::lround(dpi), 1, 65535));
+  };
   info.density_unit = 1;
   info.X_density = clamp(metadata.dpiX > 0 ? metadata.dpiX : otherwise);
   info.Y_density = clamp(metadata.dpiY > 0 ? metadata.dpiY : otherwise);
 }
 
-void SetParameters(JpegWriter& writer, const PictureRecord& picture, bool gray, const EncodeOptions& options) {
+void SetParameters(JpegWriter& writer, const PictureRecord& picture, bool gray,
+                   const EncodeOptions& options) {
   jpeg_compress_struct& info = writer.info;
   jpeg_create_compress(&info);
   info.client_data = &writer.out;
@@ -212,7 +225,8 @@ void SetParameters(JpegWriter& writer, const PictureRecord& picture, bool gray, 
 }
 
 // One segment of a heading and data. False, without a trace, when there is too much for one.
-bool WriteSegment(jpeg_compress_struct& info, int marker, std::string_view head, std::span<const uint8_t> data) {
+bool WriteSegment(jpeg_compress_struct& info, int marker, std::string_view head,
+                  std::span<const uint8_t> data) {
   if (data.empty()) return true;
   if (head.size() + data.size() > kMostSegment) return false;
   jpeg_write_m_header(&info, marker, static_cast<unsigned>(head.size() + data.size()));
@@ -237,7 +251,8 @@ bool WriteProfile(jpeg_compress_struct& info, std::span<const uint8_t> profile) 
 }
 
 void WriteMetadata(jpeg_compress_struct& info, PictureRecord& picture) {
-  if (!WriteSegment(info, kApp1, kExifHead, picture.metadata.exif)) picture.lostMetadata |= kLostExif;
+  if (!WriteSegment(info, kApp1, kExifHead, picture.metadata.exif))
+    picture.lostMetadata |= kLostExif;
   if (!WriteSegment(info, kApp1, kXmpHead, picture.metadata.xmp)) picture.lostMetadata |= kLostXmp;
   if (!WriteProfile(info, picture.metadata.icc)) picture.lostMetadata |= kLostIcc;
   (void)WriteSegment(info, JPEG_COM, {}, picture.comment);
@@ -250,7 +265,8 @@ void ExpandRow(const PictureRecord& picture, int32_t y, bool gray, std::vector<u
   const size_t perByte = 8 / bits;
   const uint32_t mask = (1u << bits) - 1;
   for (size_t x = 0; x < static_cast<size_t>(picture.image.Width()); ++x) {
-    const uint8_t* color = &picture.palette[3 * (row[x / perByte] >> (perByte - 1 - x % perByte) * bits & mask)];
+    const uint8_t* color =
+        &picture.palette[3 * (row[x / perByte] >> (perByte - 1 - x % perByte) * bits & mask)];
     if (gray) {
       target[x] = color[0];
     } else {
@@ -264,7 +280,8 @@ void ExpandRow(const PictureRecord& picture, int32_t y, bool gray, std::vector<u
 Status WriteAll(JpegWriter& writer, PictureRecord& picture, const WriteOptions& options) {
   const PackedImage& image = picture.image;
   const bool gray = HasOnlyGrays(picture.palette, image.Colors());
-  std::vector<uint8_t> expanded(image.Bits() == 24 ? 0 : (gray ? 1 : 3) * static_cast<size_t>(image.Width()));
+  std::vector<uint8_t> expanded(
+      image.Bits() == 24 ? 0 : (gray ? 1 : 3) * static_cast<size_t>(image.Width()));
   Status status = Status::Ok;
   const bool written = Guarded(writer.errors, [&] {
     SetParameters(writer, picture, gray, options.encode);
@@ -292,23 +309,27 @@ const char* ColorSpaceName(J_COLOR_SPACE space) {
   }
 }
 
-void AddDetails(const jpeg_decompress_struct& info, const PictureRecord& picture, DetailLines& lines) {
+void AddDetails(const jpeg_decompress_struct& info, const PictureRecord& picture,
+                DetailLines& lines) {
   lines.AddFormat("      Process: %s", info.progressive_mode ? "progressive" : "sequential");
   lines.AddFormat("  Color space: %s", ColorSpaceName(info.jpeg_color_space));
   if (info.num_components >= 3) {
     const jpeg_component_info& luma = info.comp_info[0];
     const jpeg_component_info& chroma = info.comp_info[1];
-    lines.AddFormat("     Sampling: %dx%d, %dx%d", luma.h_samp_factor, luma.v_samp_factor, chroma.h_samp_factor,
-                    chroma.v_samp_factor);
+    lines.AddFormat("     Sampling: %dx%d, %dx%d", luma.h_samp_factor, luma.v_samp_factor,
+                    chroma.h_samp_factor, chroma.v_samp_factor);
   }
   const PictureMetadata& metadata = picture.metadata;
-  if (metadata.dpiX > 0) lines.AddFormat("   Resolution: %.0f x %.0f dpi", metadata.dpiX, metadata.dpiY);
-  if (info.restart_interval > 0) lines.AddFormat("     Restarts: every %u blocks", info.restart_interval);
+  if (metadata.dpiX > 0)
+    lines.AddFormat("   Resolution: %.0f x %.0f dpi", metadata.dpiX, metadata.dpiY);
+  if (info.restart_interval > 0)
+    lines.AddFormat("     Restarts: every %u blocks", info.restart_interval);
   if (info.saw_Adobe_marker) lines.AddFormat(" Adobe marker: transform %d", info.Adobe_transform);
   if (!metadata.icc.empty()) lines.AddFormat("  ICC profile: %zu bytes", metadata.icc.size());
   if (!metadata.exif.empty()) lines.AddFormat("         EXIF: %zu bytes", metadata.exif.size());
   if (!metadata.xmp.empty()) lines.AddFormat("          XMP: %zu bytes", metadata.xmp.size());
-  if (!picture.comment.empty()) lines.Add("      Comment: " + std::string(picture.comment.begin(), picture.comment.end()));
+  if (!picture.comment.empty())
+    lines.Add("      Comment: " + std::string(picture.comment.begin(), picture.comment.end()));
 }
 
 }  // namespace
@@ -334,9 +355,11 @@ Status JpegRead(PictureRecord& picture, const ReadRequest& request) {
   JpegReader reader;
   RETURN_IF_BAD(ReadJpegHeader(reader, file.Bytes()));
   RETURN_IF_BAD(DescribePicture(reader, picture));
-  if (!Guarded(reader.errors, [&] { SetOutput(reader.info, request.thumbnailSide); })) return reader.Failure();
+  if (!Guarded(reader.errors, [&] { SetOutput(reader.info, request.thumbnailSide); }))
+    return reader.Failure();
   PackedImage image;
-  const auto width = static_cast<int32_t>(reader.info.output_width), height = static_cast<int32_t>(reader.info.output_height);
+  const auto width = static_cast<int32_t>(reader.info.output_width),
+             height = static_cast<int32_t>(reader.info.output_height);
   RETURN_IF_BAD(CheckFileMemory(JpegCoefficientBytes(reader, false) + PackedRowBytes(width, height, picture.bitsPerPixel)));
   RETURN_IF_BAD(NewPackedImage(width, height, &picture.palette, picture.bitsPerPixel, image));
   RETURN_IF_BAD(ReadPixels(reader, picture, image));
@@ -351,9 +374,12 @@ Status JpegRead(PictureRecord& picture, const ReadRequest& request) {
 Status JpegWrite(PictureRecord& picture, const WriteOptions& options) {
   const ProgressScope progress(picture);
   if (picture.image.Empty()) return Status::MemoryAllocationError;
-  if (picture.image.Width() > JPEG_MAX_DIMENSION || picture.image.Height() > JPEG_MAX_DIMENSION) return Status::UnsuitableImage;
-  const uint64_t pixels = static_cast<uint64_t>(picture.image.Width()) * static_cast<uint64_t>(picture.image.Height());
-  const uint64_t coefficients = picture.image.Bits() == 24 ? 3 * sizeof(JCOEF) * pixels : sizeof(JCOEF) * pixels;
+  if (picture.image.Width() > JPEG_MAX_DIMENSION || picture.image.Height() > JPEG_MAX_DIMENSION)
+    return Status::UnsuitableImage;
+  const uint64_t pixels =
+      static_cast<uint64_t>(picture.image.Width()) * static_cast<uint64_t>(picture.image.Height());
+  const uint64_t coefficients =
+      picture.image.Bits() == 24 ? 3 * sizeof(JCOEF) * pixels : sizeof(JCOEF) * pixels;
   const uint64_t held = picture.image.Bytes().size() + picture.alpha.Bytes().size();
   RETURN_IF_BAD(CheckFileMemory(held + (options.encode.jpegProgressive ? coefficients : 0)));
   JpegWriter writer;

@@ -6,9 +6,9 @@
 
 namespace fotomill {
 
-// JPEG. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when pixel data are cut short,
-// MemoryAllocationError (6), UnsupportedFormat (8) for the processes that are not decoded (arithmetic, lossless, 12 bits).
-// `thumbnailSide` of the request asks for a smaller decode.
+// JPEG. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when pixel data are cut
+// short, MemoryAllocationError (6), UnsupportedFormat (8) for the processes that are not decoded
+// (arithmetic, lossless, 12 bits). `thumbnailSide` of the request asks for a smaller decode.
 Status JpegInfo(PictureRecord& picture, const ReadRequest& request);
 Status JpegRead(PictureRecord& picture, const ReadRequest& request);
 // Also UnsuitableImage (13) for sides over 65535, ErrorCreatingFile (10), ErrorWritingFile (11).

@@ -12,7 +12,9 @@ namespace {
 
 constexpr int kMostScans = 500;  // of a progressive file; more are an attack on time
 
-JpegErrors& ErrorsOf(j_common_ptr common) { return *static_cast<JpegErrors*>(static_cast<void*>(common->err)); }
+JpegErrors& ErrorsOf(j_common_ptr common) {
+  return *static_cast<JpegErrors*>(static_cast<void*>(common->err));
+}
 
 [[noreturn]] void OnError(j_common_ptr common) {
   ErrorsOf(common).code = common->err->msg_code;
@@ -32,7 +34,8 @@ void OnMessage(j_common_ptr common, int level) {
   } else if (message.find("premature end of data segment") != std::string_view::npos) {
     errors.cutShort = true;
   }
-  const bool damage = message.starts_with("Corrupt JPEG data") && message.find("extraneous bytes") == std::string_view::npos;
+  const bool damage = message.starts_with("Corrupt JPEG data") &&
+                      message.find("extraneous bytes") == std::string_view::npos;
   char* const place = damage ? errors.warning : errors.note;
   if (place[0] == 0 && !errors.endMissing) std::memcpy(place, text, sizeof text);
 }
@@ -44,7 +47,8 @@ void Watch(j_common_ptr common) {
   const auto* info = static_cast<const jpeg_decompress_struct*>(static_cast<void*>(common));
   const auto* reader = static_cast<const JpegReader*>(info->client_data);
   ErrorsOf(common).stopped = reader->stop.Asked();
-  if (ErrorsOf(common).stopped || info->input_scan_number > kMostScans) common->err->error_exit(common);
+  if (ErrorsOf(common).stopped || info->input_scan_number > kMostScans)
+    common->err->error_exit(common);
 }
 
 // Whether a segment is one that travels with the picture.
@@ -54,8 +58,9 @@ bool IsKept(const JpegSegment& segment) {
          (segment.marker == kApp1 && (segment.Starts(kExifHead) || segment.Starts(kXmpHead)));
 }
 
-// Walks to the first scan: keeps segments, the library's own way of which takes the square of their number, and refuses what
-// holds too little of a picture for its length, such as a hole of a terabyte behind the first bytes.
+// Walks to the first scan: keeps segments, the library's own way of which takes the square of their
+// number, and refuses what holds too little of a picture for its length, such as a hole of a
+// terabyte behind the first bytes.
 Status WalkHead(JpegReader& reader, std::span<const uint8_t> file) {
   ByteReader bytes(file);
   bytes.Skip(2);
@@ -73,7 +78,8 @@ Status WalkHead(JpegReader& reader, std::span<const uint8_t> file) {
     if (byte == 0 || byte == 0x01 || (byte >= 0xD0 && byte <= 0xD8)) continue;
     const uint16_t length = bytes.Be16();
     segment.data = bytes.Take(length < 2 ? 0u : length - 2u);
-    if (bytes.Ok() && IsKept(segment) && reader.segments.size() < limits.jpegSegments) reader.segments.push_back(segment);
+    if (bytes.Ok() && IsKept(segment) && reader.segments.size() < limits.jpegSegments)
+      reader.segments.push_back(segment);
   }
   return Status::Ok;  // the library tells what is missing
 }
@@ -98,7 +104,8 @@ Status JpegErrors::Meaning(j_common_ptr common) {
   char text[JMSG_LENGTH_MAX];
   base.format_message(common, text);
   const std::string_view message(text);
-  if (message.starts_with("Unsupported") || message.starts_with("Sorry")) return Status::UnsupportedFormat;
+  if (message.starts_with("Unsupported") || message.starts_with("Sorry"))
+    return Status::UnsupportedFormat;
   if (message.starts_with("Insufficient memory")) return Status::MemoryAllocationError;
   return endMissing ? Status::FileReadError : Status::DamagedFile;
 }
@@ -124,7 +131,8 @@ uint64_t JpegCoefficientBytes(const JpegReader& reader, bool all) {
   uint64_t blocks = 0;
   for (int i = 0; held && i < info.num_components; ++i) {
     const jpeg_component_info& component = info.comp_info[i];
-    blocks += (uint64_t{component.width_in_blocks} + MAX_SAMP_FACTOR) * (component.height_in_blocks + MAX_SAMP_FACTOR);
+    blocks += (uint64_t{component.width_in_blocks} + MAX_SAMP_FACTOR) *
+              (component.height_in_blocks + MAX_SAMP_FACTOR);
   }
   return blocks * sizeof(JBLOCK);
 }

@@ -32,7 +32,8 @@ struct JpegErrors {
   Status Meaning(j_common_ptr common);
 };
 
-// Runs library calls; false when one of them failed. Nothing with a destructor may live inside `action`.
+// Runs library calls; false when one of them failed. Nothing with a destructor may live inside
+// `action`.
 template <typename Action>
 bool Guarded(JpegErrors& errors, Action action) {
   if (setjmp(errors.jump) != 0) return false;
@@ -51,17 +52,19 @@ struct JpegReader {
 
   JpegErrors errors;
   jpeg_decompress_struct info = {};
-  jpeg_progress_mgr monitor = {};  // ends files of absurdly many scans, and those that nobody wants any more
+  // ends files of absurdly many scans, and those that nobody wants any more
+  jpeg_progress_mgr monitor = {};
   StopToken stop = {};
   std::vector<JpegSegment> segments;  // those kept, in the order of the file
 };
 
-// Reads a file up to its first scan, keeping the segments of EXIF, XMP, profiles and comments. `file` must stay until the
-// reader is done.
+// Reads a file up to its first scan, keeping the segments of EXIF, XMP, profiles and comments.
+// `file` must stay until the reader is done.
 Status ReadJpegHeader(JpegReader& reader, std::span<const uint8_t> file);
 
-// Bytes of the arrays in which the library holds all coefficients of a picture: always for `all`, else only where its scans
-// come one after the other, whatever the size that it is decoded at. Known once the header is read.
+// Bytes of the arrays in which the library holds all coefficients of a picture: always for `all`,
+// else only where its scans come one after the other, whatever the size that it is decoded at.
+// Known once the header is read.
 uint64_t JpegCoefficientBytes(const JpegReader& reader, bool all);
 
 }  // namespace fotomill

@@ -1,13 +1,13 @@
-// Lossless turning of JPEG pictures, a block of 8 x 8 coefficients at a time. With F(v, u) for the vertical frequency v and the
-// horizontal frequency u, a mirrored block is
+// Lossless turning of JPEG pictures, a block of 8 x 8 coefficients at a time. With F(v, u) for the
+// vertical frequency v and the horizontal frequency u, a mirrored block is
 //
 //   left and right exchanged:  F(v, u) * (-1)^u
 //   top and bottom exchanged:  F(v, u) * (-1)^v
 //   rows become columns:       F(u, v); so do the quantization tables and the sampling factors
 //
-// since odd cosines change their sign about the block's middle and even ones do not. What is left is to put the blocks in
-// their new places. A rest of a block at the right or lower edge stays at that edge; it cannot become the first one.
-// Source: ITU-T T.81 (1992), annex A.3.3.
+// since odd cosines change their sign about the block's middle and even ones do not. What is left
+// is to put the blocks in their new places. A rest of a block at the right or lower edge stays at
+// that edge; it cannot become the first one. Source: ITU-T T.81 (1992), annex A.3.3.
 #include "formats/jpeg/jpeg_turn.h"
 
 #include <array>
@@ -31,11 +31,13 @@ struct BlockTurn {
       const int v = i / DCTSIZE, u = i % DCTSIZE;
       const int fromV = turn.swap ? u : v, fromU = turn.swap ? v : u;
       from[i] = static_cast<uint8_t>(fromV * DCTSIZE + fromU);
-      sign[i] = (turn.flipX && fromU % 2 != 0) != (turn.flipY && fromV % 2 != 0) ? JCOEF{-1} : JCOEF{1};
+      sign[i] =
+          (turn.flipX && fromU % 2 != 0) != (turn.flipY && fromV % 2 != 0) ? JCOEF{-1} : JCOEF{1};
     }
   }
   void Apply(const JCOEF* source, JCOEF* target) const {
-    for (int i = 0; i < kCoefficients; ++i) target[i] = static_cast<JCOEF>(source[from[i]] * sign[i]);
+    for (int i = 0; i < kCoefficients; ++i)
+      target[i] = static_cast<JCOEF>(source[from[i]] * sign[i]);
   }
   std::array<uint8_t, kCoefficients> from;
   std::array<JCOEF, kCoefficients> sign;
@@ -90,8 +92,8 @@ void Measure(JpegTurner& turner, Turn turn, bool trim, TurnedJpeg& turned) {
   turner.height = old.image_height - restDown;
   turned.trimmed = restAcross > 0 || restDown > 0;
   if (turned.trimmed && (!trim || turner.width == 0 || turner.height == 0)) {
-    turned.obstacle =
-        TrRecorded("The size is not a multiple of the block size of %1 x %2 pixels.", pieceWidth, pieceHeight);
+    turned.obstacle = TrRecorded("The size is not a multiple of the block size of %1 x %2 pixels.",
+                                 pieceWidth, pieceHeight);
   }
   turned.width = static_cast<int32_t>(turn.swap ? turner.height : turner.width);
   turned.height = static_cast<int32_t>(turn.swap ? turner.width : turner.height);
@@ -104,7 +106,8 @@ void LayOut(JpegTurner& turner, Turn turn) {
     const jpeg_component_info& component = old.comp_info[i];
     Plane& plane = turner.planes[static_cast<size_t>(i)];
     const auto kept = [](JDIMENSION pixels, int factor, int most) {
-      return RoundedUp(pixels * static_cast<JDIMENSION>(factor), static_cast<JDIMENSION>(most) * DCTSIZE);
+      return RoundedUp(pixels * static_cast<JDIMENSION>(factor),
+                       static_cast<JDIMENSION>(most) * DCTSIZE);
     };
     plane.fromWidth = kept(turner.width, component.h_samp_factor, old.max_h_samp_factor);
     plane.fromHeight = kept(turner.height, component.v_samp_factor, old.max_v_samp_factor);
@@ -124,12 +127,14 @@ Status ReadBlocks(JpegTurner& turner, std::span<const uint8_t> file, TurnedJpeg&
   JpegReader& reader = turner.reader;
   const bool read = Guarded(reader.errors, [&] {
     jvirt_barray_ptr* arrays = jpeg_read_coefficients(&reader.info);
-    for (int i = 0; i < reader.info.num_components; ++i) turner.planes[static_cast<size_t>(i)].from = arrays[i];
+    for (int i = 0; i < reader.info.num_components; ++i)
+      turner.planes[static_cast<size_t>(i)].from = arrays[i];
   });
   if (!read) return reader.Failure();
   if (reader.errors.cutShort && reader.errors.endMissing) return Status::FileReadError;
   turned.end = file.size() - reader.info.src->bytes_in_buffer;
-  if (reader.errors.base.num_warnings > 0) turned.obstacle = TrRecorded("The file is damaged, although it can be shown.");
+  if (reader.errors.base.num_warnings > 0)
+    turned.obstacle = TrRecorded("The file is damaged, although it can be shown.");
   return Status::Ok;
 }
 
@@ -139,7 +144,8 @@ void SetPictureForm(JpegTurner& turner, Turn turn) {
   jpeg_copy_critical_parameters(&old, &info);
   info.image_width = turn.swap ? turner.height : turner.width;
   info.image_height = turn.swap ? turner.width : turner.height;
-  info.write_JFIF_header = info.write_Adobe_marker = FALSE;  // the old file's own segments are taken over
+  // the old file's own segments are taken over
+  info.write_JFIF_header = info.write_Adobe_marker = FALSE;
   info.restart_interval = old.restart_interval;
   info.optimize_coding = TRUE;
   for (int i = 0; i < info.num_components; ++i) {
@@ -151,7 +157,8 @@ void SetPictureForm(JpegTurner& turner, Turn turn) {
   for (JQUANT_TBL* table : info.quant_tbl_ptrs) {
     if (table == nullptr) continue;
     for (int v = 0; v < DCTSIZE; ++v) {
-      for (int u = 0; u < v; ++u) std::swap(table->quantval[v * DCTSIZE + u], table->quantval[u * DCTSIZE + v]);
+      for (int u = 0; u < v; ++u)
+        std::swap(table->quantval[v * DCTSIZE + u], table->quantval[u * DCTSIZE + v]);
     }
   }
 }
@@ -162,8 +169,10 @@ void RequestBlocks(JpegTurner& turner) {
   const auto common = static_cast<j_common_ptr>(static_cast<void*>(&info));
   for (int i = 0; i < info.num_components; ++i) {
     Plane& plane = turner.planes[static_cast<size_t>(i)];
-    const auto across = static_cast<JDIMENSION>(plane.across), down = static_cast<JDIMENSION>(plane.down);
-    plane.to = info.mem->request_virt_barray(common, JPOOL_IMAGE, TRUE, RoundedUp(plane.width, across) * across,
+    const auto across = static_cast<JDIMENSION>(plane.across),
+               down = static_cast<JDIMENSION>(plane.down);
+    plane.to = info.mem->request_virt_barray(common, JPOOL_IMAGE, TRUE,
+                                             RoundedUp(plane.width, across) * across,
                                              RoundedUp(plane.height, down) * down, down);
   }
 }
@@ -172,25 +181,34 @@ void RequestBlocks(JpegTurner& turner) {
 void TurnBlocks(JpegTurner& turner, const Plane& plane, Turn turn, const BlockTurn& block) {
   const auto old = static_cast<j_common_ptr>(static_cast<void*>(&turner.reader.info));
   const auto made = static_cast<j_common_ptr>(static_cast<void*>(&turner.info));
-  const auto fromRow = [&](JDIMENSION row) { return *old->mem->access_virt_barray(old, plane.from, row, 1, FALSE); };
-  const auto toRow = [&](JDIMENSION row) { return *made->mem->access_virt_barray(made, plane.to, row, 1, TRUE); };
-  const auto source = [](bool flip, JDIMENSION place, JDIMENSION count) { return flip ? count - 1 - place : place; };
+  const auto fromRow = [&](JDIMENSION row) {
+    return *old->mem->access_virt_barray(old, plane.from, row, 1, FALSE);
+  };
+  const auto toRow = [&](JDIMENSION row) {
+    return *made->mem->access_virt_barray(made, plane.to, row, 1, TRUE);
+  };
+  const auto source = [](bool flip, JDIMENSION place, JDIMENSION count) {
+    return flip ? count - 1 - place : place;
+  };
   for (JDIMENSION y = 0; y < plane.height; ++y) {
     JBLOCKROW target = toRow(y);
     if (!turn.swap) {
       const JBLOCKROW row = fromRow(source(turn.flipY, y, plane.fromHeight));
-      for (JDIMENSION x = 0; x < plane.width; ++x) block.Apply(row[source(turn.flipX, x, plane.fromWidth)], target[x]);
+      for (JDIMENSION x = 0; x < plane.width; ++x)
+        block.Apply(row[source(turn.flipX, x, plane.fromWidth)], target[x]);
       continue;
     }
     const JDIMENSION column = source(turn.flipX, y, plane.fromWidth);
-    for (JDIMENSION x = 0; x < plane.width; ++x) block.Apply(fromRow(source(turn.flipY, x, plane.fromHeight))[column], target[x]);
+    for (JDIMENSION x = 0; x < plane.width; ++x)
+      block.Apply(fromRow(source(turn.flipY, x, plane.fromHeight))[column], target[x]);
   }
 }
 
 Status WriteTurned(JpegTurner& turner, Turn turn) {
   const BlockTurn block(turn);
   const bool written = Guarded(turner.errors, [&] {
-    turner.reader.info.err = &turner.errors.base;  // its blocks are asked for here, and fail into here
+    // its blocks are asked for here, and fail into here
+    turner.reader.info.err = &turner.errors.base;
     jpeg_create_compress(&turner.info);
     jpeg_mem_dest(&turner.info, &turner.bytes, &turner.size);
     SetPictureForm(turner, turn);
@@ -198,24 +216,28 @@ Status WriteTurned(JpegTurner& turner, Turn turn) {
     std::array<jvirt_barray_ptr, MAX_COMPONENTS> arrays = {};
     for (size_t i = 0; i < arrays.size(); ++i) arrays[i] = turner.planes[i].to;
     jpeg_write_coefficients(&turner.info, arrays.data());
-    for (int i = 0; i < turner.info.num_components; ++i) TurnBlocks(turner, turner.planes[static_cast<size_t>(i)], turn, block);
+    for (int i = 0; i < turner.info.num_components; ++i)
+      TurnBlocks(turner, turner.planes[static_cast<size_t>(i)], turn, block);
     jpeg_finish_compress(&turner.info);
   });
   if (written) return Status::Ok;
-  const Status status = turner.errors.Meaning(static_cast<j_common_ptr>(static_cast<void*>(&turner.info)));
+  const Status status =
+      turner.errors.Meaning(static_cast<j_common_ptr>(static_cast<void*>(&turner.info)));
   return status == Status::MemoryAllocationError ? status : Status::UnsuitableImage;
 }
 
 }  // namespace
 
-Status TurnJpeg(std::span<const uint8_t> file, Orientation orientation, bool trim, TurnedJpeg& turned) {
+Status TurnJpeg(std::span<const uint8_t> file, Orientation orientation, bool trim,
+                TurnedJpeg& turned) {
   turned = {};
   const Turn turn = TurnOf(orientation);
   JpegTurner turner;
   RETURN_IF_BAD(ReadJpegHeader(turner.reader, file));
   Measure(turner, turn, trim, turned);
   LayOut(turner, turn);
-  const bool fits = CheckFileMemory(2 * JpegCoefficientBytes(turner.reader, true)) == Status::Ok;  // the old and the new ones
+  // the old and the new ones
+  const bool fits = CheckFileMemory(2 * JpegCoefficientBytes(turner.reader, true)) == Status::Ok;
   if (turned.obstacle.empty() && !fits) turned.obstacle = TrRecorded("The picture is too large.");
   if (!turned.obstacle.empty()) return Status::Ok;
   RETURN_IF_BAD(ReadBlocks(turner, file, turned));

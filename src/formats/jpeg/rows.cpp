@@ -28,7 +28,8 @@ constexpr FormatSettings kSettings = {"JPG", "OverrideJpgBox", TrLater("JPEG"), 
 std::string TurboVersion() { return FOTOMILL_QUOTED_VALUE(LIBJPEG_TURBO_VERSION); }
 constexpr FormatLibrary kLibraries[] = {{"libjpeg-turbo", TurboVersion, TrLater("JPEG")}};
 
-constexpr FormatEntry Row(std::string_view extension, std::string_view description, int32_t enabled, uint32_t flags) {
+constexpr FormatEntry Row(std::string_view extension, std::string_view description, int32_t enabled,
+                          uint32_t flags) {
   const bool first = (flags & FMT_SECONDARY) == 0;
   return {.details = first ? JpegDetails : nullptr,
           .info = JpegInfo,

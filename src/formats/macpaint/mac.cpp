@@ -10,21 +10,24 @@
 //       +83   4    length of everything behind this header
 //       +91   8    creation and modification, seconds each
 //        .  512  MacPaint header: version, four bytes, then fill patterns
-//        .       720 rows, the top one first, each packed on its own into 72 bytes; a set bit is black
+//        .       720 rows, the top one first, each packed on its own into 72 bytes; a set bit is
+//        black
 //
-// A row is packed by PackBits: control byte n below 128, then n + 1 bytes as they are; or n above 128, then one byte
-// that stands 257 - n times. Every byte is inverted on its way, since entry 1 of the palette is white.
+// A row is packed by PackBits: control byte n below 128, then n + 1 bytes as they are; or n above
+// 128, then one byte that stands 257 - n times. Every byte is inverted on its way, since entry 1 of
+// the palette is white.
 //
-// Reads files without a MacBinary header, and files of rows alone, known by a first byte that is not zero. The name of
-// a MacBinary header becomes the picture's type name. Control byte 128 is skipped at the start of a row; behind a run it
-// is an error, as is a run that passes the row's end, although some programs wrote such files.
+// Reads files without a MacBinary header, and files of rows alone, known by a first byte that is
+// not zero. The name of a MacBinary header becomes the picture's type name. Control byte 128 is
+// skipped at the start of a row; behind a run it is an error, as is a run that passes the row's
+// end, although some programs wrote such files.
 //
-// Writes rows as runs of two and more, a MacBinary header on request, and version 2 at the start of each quarter of the
-// MacPaint header. Dates count from 1904, four hours short: the constant is a part of the format as this program writes
-// it.
+// Writes rows as runs of two and more, a MacBinary header on request, and version 2 at the start of
+// each quarter of the MacPaint header. Dates count from 1904, four hours short: the constant is a
+// part of the format as this program writes it.
 //
-// Source: Apple Computer, Macintosh Technical Note 86, "MacPaint Document Format" (1985); Dennis F. Brothers, "Macintosh
-// Binary Transfer Format Standard Proposal" (1985).
+// Source: Apple Computer, Macintosh Technical Note 86, "MacPaint Document Format" (1985); Dennis F.
+// Brothers, "Macintosh Binary Transfer Format Standard Proposal" (1985).
 #include "formats/macpaint/mac.h"
 
 #include <algorithm>
@@ -79,7 +82,8 @@ uint64_t RowsOffset(std::span<const uint8_t> bytes) {
   return bytes[0] != 0 ? 0 : kMacPaintSize;
 }
 
-// Unpacks and inverts one row. Ok, or FileReadError when the data end inside the row or do not end with it.
+// Unpacks and inverts one row. Ok, or FileReadError when the data end inside the row or do not end
+// with it.
 Status UnpackRow(ByteReader& bytes, std::span<uint8_t> row) {
   size_t filled = 0;
   while (filled < row.size()) {
@@ -89,8 +93,10 @@ Status UnpackRow(ByteReader& bytes, std::span<uint8_t> row) {
     const bool repeats = control >= kNoRun;
     const size_t count = repeats ? 257u - control : control + 1u;
     const auto data = bytes.Take(repeats ? 1 : count);
-    if (!bytes.Ok() || control == kNoRun || count > row.size() - filled) return Status::FileReadError;
-    for (size_t i = 0; i < count; ++i) row[filled + i] = static_cast<uint8_t>(~data[repeats ? 0 : i]);
+    if (!bytes.Ok() || control == kNoRun || count > row.size() - filled)
+      return Status::FileReadError;
+    for (size_t i = 0; i < count; ++i)
+      row[filled + i] = static_cast<uint8_t>(~data[repeats ? 0 : i]);
     filled += count;
   }
   return Status::Ok;
@@ -225,7 +231,8 @@ Status MacWrite(PictureRecord& picture, const WriteOptions& options) {
     RETURN_IF_BAD(picture.ReportRow(y, kHeight));
     PackRow(out, PageRow(picture.image, y));
   }
-  if (withMacBinary) out.PatchBe32(kLengthOffset, static_cast<uint32_t>(out.Position() - kMacBinarySize));
+  if (withMacBinary)
+    out.PatchBe32(kLengthOffset, static_cast<uint32_t>(out.Position() - kMacBinarySize));
   return CommitOutput(out, options);
 }
 

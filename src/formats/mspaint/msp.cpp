@@ -11,12 +11,13 @@
 //       32       version 1: rows from the top, (width + 7) / 8 bytes each
 //       32       version 2: for each row the bytes of its code, 2 bytes each; then the codes
 //
-// A set bit is white. A code is made of 0, count and value for a run, and of count and so many bytes as they are. A row
-// without any code is white.
+// A set bit is white. A code is made of 0, count and value for a run, and of count and so many
+// bytes as they are. A row without any code is white.
 //
-// The reader does not look at the exclusive or, fills a row whose code ends early with white, and drops what would go
-// beyond it. The writer makes version 2 and stores the darker of two colors as black.
-// Source: J. Murray and W. vanRyper, "Encyclopedia of Graphics File Formats", 2nd edition (1996).
+// The reader does not look at the exclusive or, fills a row whose code ends early with white, and
+// drops what would go beyond it. The writer makes version 2 and stores the darker of two colors as
+// black. Source: J. Murray and W. vanRyper, "Encyclopedia of Graphics File Formats", 2nd edition
+// (1996).
 #include "formats/mspaint/msp.h"
 
 #include <algorithm>
@@ -48,7 +49,8 @@ struct MspHeader {
 Status ParseHeader(std::span<const uint8_t> file, MspHeader& header) {
   ByteReader bytes(file);
   header.coded = bytes.Match(kCoded);
-  if (!header.coded && !bytes.Match(kPlain)) return file.size() < 4 ? Status::FileReadError : Status::DamagedFile;
+  if (!header.coded && !bytes.Match(kPlain))
+    return file.size() < 4 ? Status::FileReadError : Status::DamagedFile;
   header.width = bytes.Le16();
   header.height = bytes.Le16();
   bytes.Seek(kHeaderSize);
@@ -57,7 +59,8 @@ Status ParseHeader(std::span<const uint8_t> file, MspHeader& header) {
 }
 
 void DescribePicture(const MspHeader& header, PictureRecord& picture) {
-  picture.typeName.AssignCut(header.coded ? "Microsoft Paint, version 2" : "Microsoft Paint, version 1");
+  picture.typeName.AssignCut(header.coded ? "Microsoft Paint, version 2"
+                                          : "Microsoft Paint, version 1");
   picture.width = header.width;
   picture.height = header.height;
   picture.bitsPerPixel = 1;
@@ -82,7 +85,8 @@ void DecodeRow(std::span<const uint8_t> code, std::span<uint8_t> row) {
   }
 }
 
-Status ReadRows(std::span<const uint8_t> file, const MspHeader& header, const PictureRecord& picture, PackedImage& image) {
+Status ReadRows(std::span<const uint8_t> file, const MspHeader& header,
+                const PictureRecord& picture, PackedImage& image) {
   ByteReader sizes(file), bytes(file);
   sizes.Seek(kHeaderSize);
   bytes.Seek(kHeaderSize + (header.coded ? 2 * static_cast<uint64_t>(header.height) : 0));
@@ -101,7 +105,8 @@ Status ReadRows(std::span<const uint8_t> file, const MspHeader& header, const Pi
 }
 
 void WriteHeader(ByteWriter& out, const PackedImage& image) {
-  const auto width = static_cast<uint16_t>(image.Width()), height = static_cast<uint16_t>(image.Height());
+  const auto width = static_cast<uint16_t>(image.Width()),
+             height = static_cast<uint16_t>(image.Height());
   const uint16_t words[] = {0x694c, 0x536e, width, height, 1, 1, 1, 1, width, height, 0, 0};
   uint16_t check = 0;
   for (const uint16_t word : words) {
@@ -182,7 +187,8 @@ Status MspRead(PictureRecord& picture, const ReadRequest& request) {
   RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
   DescribePicture(header, picture);
   const uint64_t least = header.coded ? 2 : header.RowSize();
-  if (file.FileSize() - kHeaderSize < least * static_cast<uint64_t>(header.height)) return Status::FileReadError;
+  if (file.FileSize() - kHeaderSize < least * static_cast<uint64_t>(header.height))
+    return Status::FileReadError;
   PackedImage image;
   RETURN_IF_BAD(NewPackedImage(header.width, header.height, &picture.palette, 1, image));
   RETURN_IF_BAD(ReadRows(file.Bytes(), header, picture, image));

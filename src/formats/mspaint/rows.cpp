@@ -8,7 +8,8 @@ namespace {
 
 using namespace std::string_view_literals;
 
-constexpr Signature kSignatures[] = {{0, "DanM"sv, "a Microsoft Paint picture"}, {0, "LinS"sv, "a Microsoft Paint picture"}};
+constexpr Signature kSignatures[] = {{0, "DanM"sv, "a Microsoft Paint picture"},
+                                     {0, "LinS"sv, "a Microsoft Paint picture"}};
 
 constexpr FormatEntry kRows[] = {{
     .info = MspInfo,

@@ -1,12 +1,13 @@
 // Paint Shop Pro images (PSP). How a file is laid out is told in psp_file.cpp.
 //
-// The first page is the whole picture: the composite that later versions store, where it is lossless, else the visible
-// layers laid one on the other. Further pages are the layers, where there are several, from the bottom up. Layers are blended
-// as normal ones whatever their mode; vectors, adjustments and masks are passed over, and the record's warning says so.
-// Samples of 16 bits come down to 8.
+// The first page is the whole picture: the composite that later versions store, where it is
+// lossless, else the visible layers laid one on the other. Further pages are the layers, where
+// there are several, from the bottom up. Layers are blended as normal ones whatever their mode;
+// vectors, adjustments and masks are passed over, and the record's warning says so. Samples of 16
+// bits come down to 8.
 //
-// The writer makes version 3, which Paint Shop Pro 5 and all later ones read: one layer, compressed by deflate; up to 8 bits as
-// 8 with a palette, everything else in three channels.
+// The writer makes version 3, which Paint Shop Pro 5 and all later ones read: one layer, compressed
+// by deflate; up to 8 bits as 8 with a palette, everything else in three channels.
 #include "formats/paintshop/psp.h"
 
 #include <zlib.h>
@@ -32,14 +33,15 @@ std::span<const PspLayer> LayersOf(const PspFile& psp, int32_t page) {
 }
 
 bool Covers(const PspLayer& layer, const PspFile& psp) {
-  return layer.place == Rectangle{0, 0, psp.width, psp.height} && layer.opacity == 255 && layer.visible &&
-         layer.Channel(PspBitmap::Transparency, PspColor::Composite) == nullptr;
+  return layer.place == Rectangle{0, 0, psp.width, psp.height} && layer.opacity == 255 &&
+         layer.visible && layer.Channel(PspBitmap::Transparency, PspColor::Composite) == nullptr;
 }
 
 // Whether a page is one opaque layer of indices.
 bool IsIndexed(const PspFile& psp, int32_t page) {
   const auto layers = LayersOf(psp, page);
-  return layers.size() == 1 && Covers(layers[0], psp) && layers[0].Channel(PspBitmap::Image, PspColor::Composite) != nullptr;
+  return layers.size() == 1 && Covers(layers[0], psp) &&
+         layers[0].Channel(PspBitmap::Image, PspColor::Composite) != nullptr;
 }
 
 bool HasAlpha(const PspFile& psp, int32_t page) {
@@ -56,11 +58,14 @@ Status DescribePicture(const PspFile& psp, int32_t page, PictureRecord& picture)
   const bool indexed = IsIndexed(psp, page);
   picture.bitsPerPixel = !indexed ? 24 : std::min(psp.bits, 8);
   picture.imageBytes = EstimateImageBytes(picture.width, picture.height, picture.bitsPerPixel);
-  picture.alphaFlags = static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (HasAlpha(psp, page) ? kHasAlpha : 0));
-  picture.simplified = psp.bits == 16 || psp.bits == 48 || psp.layers.size() > 1 || psp.otherLayers > 0;
+  picture.alphaFlags = static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) |
+                                            (HasAlpha(psp, page) ? kHasAlpha : 0));
+  picture.simplified =
+      psp.bits == 16 || psp.bits == 48 || psp.layers.size() > 1 || psp.otherLayers > 0;
   picture.metadata.dpiX = picture.metadata.dpiY = psp.dpi;
   picture.warning.Clear();
-  const bool plain = std::ranges::all_of(psp.layers, [](const PspLayer& layer) { return layer.blendMode == 0; });
+  const bool plain =
+      std::ranges::all_of(psp.layers, [](const PspLayer& layer) { return layer.blendMode == 0; });
   if (page == 0 && !psp.composite.HasPixels() && (psp.otherLayers > 0 || !plain)) {
     picture.warning.AssignCut("Layers that are not plain pixels are not shown as they should be.");
   }
@@ -85,7 +90,8 @@ class LayerRows {
       RETURN_IF_BAD(colors_[0].Open(layer, *all));
     } else {
       constexpr PspColor kColors[] = {PspColor::Red, PspColor::Green, PspColor::Blue};
-      for (size_t c = 0; c < 3; ++c) RETURN_IF_BAD(colors_[c].Open(layer, *layer.Channel(PspBitmap::Image, kColors[c])));
+      for (size_t c = 0; c < 3; ++c)
+        RETURN_IF_BAD(colors_[c].Open(layer, *layer.Channel(PspBitmap::Image, kColors[c])));
     }
     const PspChannel* transparency = layer.Channel(PspBitmap::Transparency, PspColor::Composite);
     hasTransparency_ = transparency != nullptr;
@@ -102,7 +108,8 @@ class LayerRows {
     if (count_ == 3) {
       MergeColors(&samples_[2 * width_], &samples_[width_], samples_.data(), width_, bgr.data());
     } else {
-      for (size_t x = 0; x < 3 * width_; ++x) bgr[x] = palette_[size_t{3} * samples_[x / 3] + 2 - x % 3];
+      for (size_t x = 0; x < 3 * width_; ++x)
+        bgr[x] = palette_[size_t{3} * samples_[x / 3] + 2 - x % 3];
     }
     if (!hasTransparency_) return;
     transparency_.Row(y, alpha);
@@ -123,13 +130,16 @@ class LayerRows {
 
 // Lays a pixel over what is there; `below` is null where everything is opaque.
 void LayOver(const uint8_t* color, uint32_t opacity, uint8_t* target, uint8_t* below) {
-  const uint32_t left = below == nullptr ? 255 - opacity : (*below * (255 - opacity) + 127) / 255, sum = opacity + left;
+  const uint32_t left = below == nullptr ? 255 - opacity : (*below * (255 - opacity) + 127) / 255,
+                 sum = opacity + left;
   if (sum == 0) return;
-  for (size_t c = 0; c < 3; ++c) target[c] = static_cast<uint8_t>((color[c] * opacity + target[c] * left + sum / 2) / sum);
+  for (size_t c = 0; c < 3; ++c)
+    target[c] = static_cast<uint8_t>((color[c] * opacity + target[c] * left + sum / 2) / sum);
   if (below != nullptr) *below = static_cast<uint8_t>(sum);
 }
 
-Status DrawLayer(const PspFile& psp, const PspLayer& layer, const PictureRecord& picture, PackedImage& image, PackedImage& alpha) {
+Status DrawLayer(const PspFile& psp, const PspLayer& layer, const PictureRecord& picture,
+                 PackedImage& image, PackedImage& alpha) {
   LayerRows rows;
   RETURN_IF_BAD(rows.Open(psp, layer));
   const Rectangle& place = layer.place;
@@ -144,8 +154,8 @@ Status DrawLayer(const PspFile& psp, const PspLayer& layer, const PictureRecord&
     uint8_t* const opacity = alpha.Empty() ? nullptr : alpha.Row(static_cast<int32_t>(y)).data();
     for (int64_t x = first; x < end; ++x) {
       const int64_t target = x + place.x;
-      LayOver(&rows.bgr[static_cast<size_t>(3 * x)], rows.alpha[static_cast<size_t>(x)], row + 3 * target,
-              opacity == nullptr ? nullptr : opacity + target);
+      LayOver(&rows.bgr[static_cast<size_t>(3 * x)], rows.alpha[static_cast<size_t>(x)],
+              row + 3 * target, opacity == nullptr ? nullptr : opacity + target);
     }
   }
   return Status::Ok;
@@ -161,16 +171,19 @@ Status ReadIndexed(const PspLayer& layer, const PictureRecord& picture, PackedIm
     plane.Row(y, samples);
     const auto row = image.Row(y);
     for (size_t x = 0; x < samples.size(); ++x) {
-      row[x / perByte] = static_cast<uint8_t>(row[x / perByte] | samples[x] << (8 - bits * (x % perByte + 1)));
+      row[x / perByte] =
+          static_cast<uint8_t>(row[x / perByte] | samples[x] << (8 - bits * (x % perByte + 1)));
     }
     RETURN_IF_BAD(picture.ReportRow(y));
   }
   return Status::Ok;
 }
 
-Status ReadLayers(const PspFile& psp, int32_t page, const PictureRecord& picture, PackedImage& image, PackedImage& alpha) {
+Status ReadLayers(const PspFile& psp, int32_t page, const PictureRecord& picture,
+                  PackedImage& image, PackedImage& alpha) {
   const auto layers = LayersOf(psp, page);
-  for (const PspLayer& layer : layers) RETURN_IF_BAD(CheckPackedSize(layer.place.width, layer.place.height, 24));
+  for (const PspLayer& layer : layers)
+    RETURN_IF_BAD(CheckPackedSize(layer.place.width, layer.place.height, 24));
   RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette, 24, image));
   if (HasAlpha(psp, page)) RETURN_IF_BAD(NewAlphaPlane(picture.width, picture.height, alpha));
   for (const PspLayer& layer : layers) {
@@ -179,7 +192,8 @@ Status ReadLayers(const PspFile& psp, int32_t page, const PictureRecord& picture
   return Status::Ok;
 }
 
-Status OpenImage(platform::FileView& file, const std::string& name, int32_t page, PspFile& psp, PictureRecord& picture) {
+Status OpenImage(platform::FileView& file, const std::string& name, int32_t page, PspFile& psp,
+                 PictureRecord& picture) {
   if (!file.Open(name)) return Status::FileOpenError;
   picture.fileSize = file.FileSize();
   RETURN_IF_BAD(ParsePsp(file.Bytes(), psp));
@@ -243,7 +257,8 @@ void WriteLayerFacts(ByteWriter& out, const PackedImage& image) {
   out.U8(0);  // plain pixels
   writeRectangle(true);
   writeRectangle(true);
-  for (const int fact : {255, 0, 1, 0, 0}) out.U8(static_cast<uint8_t>(fact));  // opacity, blend mode, visible, not protected, no group
+  // opacity, blend mode, visible, not protected, no group
+  for (const int fact : {255, 0, 1, 0, 0}) out.U8(static_cast<uint8_t>(fact));
   writeRectangle(false);  // no mask
   writeRectangle(false);
   out.Zeros(3 + 2 + 40);  // nor ranges to be blended
@@ -254,7 +269,9 @@ void WriteLayerFacts(ByteWriter& out, const PackedImage& image) {
 // Hands rows of one channel to deflate. False when that fails.
 class ChannelWriter {
  public:
-  explicit ChannelWriter(ByteWriter& out) : out_(out) { ready_ = deflateInit(&stream_, Z_DEFAULT_COMPRESSION) == Z_OK; }
+  explicit ChannelWriter(ByteWriter& out) : out_(out) {
+    ready_ = deflateInit(&stream_, Z_DEFAULT_COMPRESSION) == Z_OK;
+  }
   ~ChannelWriter() { deflateEnd(&stream_); }
   ChannelWriter(const ChannelWriter&) = delete;
   ChannelWriter& operator=(const ChannelWriter&) = delete;
@@ -286,7 +303,8 @@ void GatherRow(const PackedImage& image, size_t channel, int32_t y, std::span<ui
   } else if (image.Bits() == 8) {
     std::copy_n(source.begin(), row.size(), row.begin());
   } else {
-    for (size_t x = 0; x < row.size(); ++x) row[x] = static_cast<uint8_t>(image.PixelAt(static_cast<int32_t>(x), y));
+    for (size_t x = 0; x < row.size(); ++x)
+      row[x] = static_cast<uint8_t>(image.PixelAt(static_cast<int32_t>(x), y));
   }
 }
 
@@ -294,7 +312,8 @@ Status WriteChannel(ByteWriter& out, const PictureRecord& picture, size_t channe
   const PackedImage& image = picture.image;
   const bool indexed = image.Bits() <= 8;
   const uint64_t place = out.Position();
-  const uint64_t plain = static_cast<uint64_t>(image.Width()) * static_cast<uint64_t>(image.Height());
+  const uint64_t plain =
+      static_cast<uint64_t>(image.Width()) * static_cast<uint64_t>(image.Height());
   WriteBlockHead(out, 5, kChannelPart, 0);
   out.Le32(0);
   out.Le32(static_cast<uint32_t>(plain));
@@ -377,7 +396,8 @@ Status PspDetails(PictureRecord& picture) {
   lines.AddFormat("       Pixels: %d bits%s", psp.bits, psp.gray ? ", gray" : "");
   lines.AddFormat("       Layers: %zu of pixels", psp.layers.size());
   if (psp.otherLayers > 0) lines.AddFormat(" Other layers: %d", psp.otherLayers);
-  lines.AddFormat("  Compression: %s", compression < std::size(kNames) ? kNames[compression] : "unknown");
+  lines.AddFormat("  Compression: %s",
+                  compression < std::size(kNames) ? kNames[compression] : "unknown");
   return Status::Ok;
 }
 

@@ -3,24 +3,31 @@
 //   offset size  field
 //        0   32  "Paint Shop Pro Image File\n", 1A, zeros
 //       32    4  version: major, minor; 3 is that of Paint Shop Pro 5, 4 of 6, 5 of 7, 6 of 8
-//       36       blocks: "~BK", 0, number (2), in version 3 the bytes of the first part (4), bytes of the whole (4), data; later
-//                versions have the bytes of a part, itself included (4), at the beginning of each part
+//       36       blocks: "~BK", 0, number (2), in version 3 the bytes of the first part (4), bytes
+//       of the whole (4), data; later
+//                versions have the bytes of a part, itself included (4), at the beginning of each
+//                part
 //
-//   0 image: width, height (4 each), resolution (8), its metric (1: 1 inches, 2 centimeters), compression (2: 0 none, 1 run
+//   0 image: width, height (4 each), resolution (8), its metric (1: 1 inches, 2 centimeters),
+//   compression (2: 0 none, 1 run
 //     lengths, 2 deflate, 3 JPEG), bits of a pixel (2), planes (2), colors (4), gray (1), ...
 //   2 palette: entries (4), then blue, green, red, 0 each
 //   3 layers: a block 4 for each, from the bottom up
-//   4 layer: name (version 3: 256 bytes, later: length (2) and text), kind (1), rectangle of the image and of the saved part
-//     (left, top, right, bottom, 4 each), opacity, blend mode, visible (1 each), ..., bitmaps, channels (2 each; later in a
-//     part of their own), then a block 5 for each channel
-//   5 channel: compressed and plain bytes (4 each), bitmap (2: 0 image, 1 transparency), color (2: 0 all in one, 1 red, 2
+//   4 layer: name (version 3: 256 bytes, later: length (2) and text), kind (1), rectangle of the
+//   image and of the saved part
+//     (left, top, right, bottom, 4 each), opacity, blend mode, visible (1 each), ..., bitmaps,
+//     channels (2 each; later in a part of their own), then a block 5 for each channel
+//   5 channel: compressed and plain bytes (4 each), bitmap (2: 0 image, 1 transparency), color (2:
+//   0 all in one, 1 red, 2
 //     green, 3 blue), data
-//   16 composites: blocks 17 with width, height (4 each), bits, compression, planes (2 each), colors (4), kind (2: 0 the
-//     whole picture, 1 a thumbnail), then in that order blocks 9 with bitmaps, channels (2 each) and blocks 5, or blocks 18
-//     of JPEG
+//   16 composites: blocks 17 with width, height (4 each), bits, compression, planes (2 each),
+//   colors (4), kind (2: 0 the
+//     whole picture, 1 a thumbnail), then in that order blocks 9 with bitmaps, channels (2 each)
+//     and blocks 5, or blocks 18 of JPEG
 //
-// A run-length token is a count and so many bytes as they are, or from 129 on one byte that is repeated count - 128 times.
-// Source: Jasc Software, "Paint Shop Pro (PSP) File Format Specification", versions 3.0 to 6.0 (1998 to 2003).
+// A run-length token is a count and so many bytes as they are, or from 129 on one byte that is
+// repeated count - 128 times. Source: Jasc Software, "Paint Shop Pro (PSP) File Format
+// Specification", versions 3.0 to 6.0 (1998 to 2003).
 #include "formats/paintshop/psp_file.h"
 
 #include <algorithm>
@@ -36,8 +43,17 @@ namespace {
 constexpr std::string_view kSignature = "Paint Shop Pro Image File\n\x1a";
 constexpr uint64_t kHeaderSize = 36;
 constexpr size_t kMostLayers = 10000, kMostChannels = 64;
-enum Block : uint16_t { Image = 0, Colors = 2, Layers = 3, Layer = 4, Channel = 5, Composite = 9, Composites = 16, CompositeFacts = 17,
-                        JpegComposite = 18 };
+enum Block : uint16_t {
+  Image = 0,
+  Colors = 2,
+  Layers = 3,
+  Layer = 4,
+  Channel = 5,
+  Composite = 9,
+  Composites = 16,
+  CompositeFacts = 17,
+  JpegComposite = 18
+};
 
 struct BlockView {
   uint16_t number = 0;
@@ -78,7 +94,8 @@ void TakeImage(ByteReader bytes, PspFile& psp) {
   bytes.Skip(2 + 4);
   psp.gray = bytes.U8() != 0;
   if (!bytes.Ok()) psp.width = 0;
-  if (resolution > 0 && resolution < 1e6 && metric > 0) psp.dpi = metric == 2 ? resolution * 2.54 : resolution;
+  if (resolution > 0 && resolution < 1e6 && metric > 0)
+    psp.dpi = metric == 2 ? resolution * 2.54 : resolution;
 }
 
 void TakeColors(ByteReader bytes, PspFile& psp) {
@@ -112,8 +129,11 @@ void TakeChannels(std::span<const uint8_t> data, uint16_t version, PspLayer& lay
 Rectangle TakeRectangle(ByteReader& bytes) {
   int64_t sides[4];
   for (int64_t& side : sides) side = static_cast<int32_t>(bytes.Le32());
-  const auto length = [](int64_t from, int64_t to) { return static_cast<int32_t>(std::clamp<int64_t>(to - from, 0, INT32_MAX)); };
-  return {static_cast<int32_t>(sides[0]), static_cast<int32_t>(sides[1]), length(sides[0], sides[2]), length(sides[1], sides[3])};
+  const auto length = [](int64_t from, int64_t to) {
+    return static_cast<int32_t>(std::clamp<int64_t>(to - from, 0, INT32_MAX));
+  };
+  return {static_cast<int32_t>(sides[0]), static_cast<int32_t>(sides[1]),
+          length(sides[0], sides[2]), length(sides[1], sides[3])};
 }
 
 void TakeLayer(const BlockView& block, PspFile& psp) {
@@ -131,7 +151,8 @@ void TakeLayer(const BlockView& block, PspFile& psp) {
   if (!bytes.Ok()) return;
   if (layer.place.width == 0) layer.place = image;
   std::span<const uint8_t> channels = BehindFirstPart(block);
-  if (psp.version >= 4) channels = channels.subspan(std::min<size_t>(ByteReader(channels).Le32(), channels.size()));
+  if (psp.version >= 4)
+    channels = channels.subspan(std::min<size_t>(ByteReader(channels).Le32(), channels.size()));
   TakeChannels(channels, psp.version, layer);
   if (layer.HasPixels() && layer.place.width > 0 && layer.place.height > 0) {
     psp.layers.push_back(std::move(layer));
@@ -169,7 +190,9 @@ void TakeComposites(const BlockView& bank, PspFile& psp) {
       ++index;
     } else if (block.number == Composite && index < whole.size()) {
       PspLayer& layer = whole[index++];
-      if (layer.place.width != psp.width || layer.place.height != psp.height || layer.bits != psp.bits) continue;
+      if (layer.place.width != psp.width || layer.place.height != psp.height ||
+          layer.bits != psp.bits)
+        continue;
       TakeChannels(BehindFirstPart(block), psp.version, layer);
       if (layer.HasPixels()) psp.composite = std::move(layer);
     }
@@ -179,19 +202,23 @@ void TakeComposites(const BlockView& bank, PspFile& psp) {
 }  // namespace
 
 const PspChannel* PspLayer::Channel(PspBitmap bitmap, PspColor color) const {
-  const auto fits = [&](const PspChannel& channel) { return channel.bitmap == bitmap && channel.color == color; };
+  const auto fits = [&](const PspChannel& channel) {
+    return channel.bitmap == bitmap && channel.color == color;
+  };
   const auto found = std::ranges::find_if(channels, fits);
   return found == channels.end() ? nullptr : &*found;
 }
 
 bool PspLayer::HasPixels() const {
   const auto has = [this](PspColor color) { return Channel(PspBitmap::Image, color) != nullptr; };
-  return has(PspColor::Composite) || (has(PspColor::Red) && has(PspColor::Green) && has(PspColor::Blue));
+  return has(PspColor::Composite) ||
+         (has(PspColor::Red) && has(PspColor::Green) && has(PspColor::Blue));
 }
 
 Status ParsePsp(std::span<const uint8_t> file, PspFile& psp) {
   ByteReader bytes(file);
-  if (!bytes.Match(kSignature)) return file.size() < kSignature.size() ? Status::FileReadError : Status::DamagedFile;
+  if (!bytes.Match(kSignature))
+    return file.size() < kSignature.size() ? Status::FileReadError : Status::DamagedFile;
   bytes.Seek(kHeaderSize - 4);
   psp.version = bytes.Le16();
   bytes.Skip(2);
@@ -207,7 +234,8 @@ Status ParsePsp(std::span<const uint8_t> file, PspFile& psp) {
   TakeComposites(composites, psp);
   if (psp.width < 1 || psp.height < 1) return Status::DamagedFile;
   constexpr int32_t kDepths[] = {1, 4, 8, 16, 24, 48};
-  return std::ranges::find(kDepths, psp.bits) == std::end(kDepths) ? Status::UnsupportedFormat : Status::Ok;
+  return std::ranges::find(kDepths, psp.bits) == std::end(kDepths) ? Status::UnsupportedFormat
+                                                                   : Status::Ok;
 }
 
 }  // namespace fotomill

@@ -20,7 +20,8 @@ bool UnpackRuns(std::span<const uint8_t> data, std::span<uint8_t> rows) {
   size_t filled = 0;
   while (filled < rows.size()) {
     const uint8_t token = bytes.U8();
-    const size_t count = token > 128 ? token - 128u : token, room = std::min(count, rows.size() - filled);
+    const size_t count = token > 128 ? token - 128u : token,
+                 room = std::min(count, rows.size() - filled);
     if (token > 128) {
       std::memset(&rows[filled], bytes.U8(), room);
     } else {
@@ -37,7 +38,8 @@ bool UnpackRuns(std::span<const uint8_t> data, std::span<uint8_t> rows) {
 Status PspPlane::Unpack(const PspLayer& layer, std::span<const uint8_t> data, uint64_t size) {
   const bool runs = layer.compression == PspCompression::RunLengths;
   if (size / (runs ? kBestRuns : kBestDeflate) > data.size()) return Status::FileReadError;
-  if (size > limits.packedBlockBytes || !unpacked_.Allocate(size)) return Status::MemoryAllocationError;
+  if (size > limits.packedBlockBytes || !unpacked_.Allocate(size))
+    return Status::MemoryAllocationError;
   if (runs) return UnpackRuns(data, unpacked_.Bytes()) ? Status::Ok : Status::FileReadError;
   uLongf filled = size;
   const int result = uncompress(unpacked_.Data(), &filled, data.data(), data.size());
@@ -46,15 +48,18 @@ Status PspPlane::Unpack(const PspLayer& layer, std::span<const uint8_t> data, ui
 }
 
 Status PspPlane::Open(const PspLayer& layer, const PspChannel& channel) {
-  const auto width = static_cast<uint64_t>(layer.place.width), height = static_cast<uint64_t>(layer.place.height);
+  const auto width = static_cast<uint64_t>(layer.place.width),
+             height = static_cast<uint64_t>(layer.place.height);
   const bool colors = channel.bitmap == PspBitmap::Image && channel.color == PspColor::Composite;
   bits_ = layer.bits == 16 || layer.bits == 48 ? 16 : colors ? std::min(layer.bits, 8) : 8;
   const uint64_t least = (width * static_cast<uint64_t>(bits_) + 7) / 8;
-  const bool padded = channel.size % height == 0 && channel.size / height > least && channel.size / height < least + 4;
+  const bool padded = channel.size % height == 0 && channel.size / height > least &&
+                      channel.size / height < least + 4;
   rowSize_ = padded ? channel.size / height : least;
   const uint64_t size = rowSize_ * height;
   rows_ = channel.data;
-  if (layer.compression == PspCompression::RunLengths || layer.compression == PspCompression::Lz77) {
+  if (layer.compression == PspCompression::RunLengths ||
+      layer.compression == PspCompression::Lz77) {
     RETURN_IF_BAD(Unpack(layer, channel.data, size));
     rows_ = unpacked_.Bytes();
   } else if (layer.compression != PspCompression::None) {

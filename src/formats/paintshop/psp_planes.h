@@ -13,7 +13,8 @@ namespace fotomill {
 // The rows of a channel, whole in memory.
 class PspPlane {
  public:
-  // FileReadError when the data cannot hold the rows, DamagedFile, MemoryAllocationError, UnsupportedFormat for JPEG.
+  // FileReadError when the data cannot hold the rows, DamagedFile, MemoryAllocationError,
+  // UnsupportedFormat for JPEG.
   Status Open(const PspLayer& layer, const PspChannel& channel);
 
   // A row as samples of 8 bits; indices of fewer bits and samples of 16 are made that.

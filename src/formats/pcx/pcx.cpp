@@ -2,8 +2,8 @@
 //
 //   offset size  field
 //        0    1  manufacturer, always 10
-//        1    1  version; 3: the fixed sixteen colors; from 5 on an 8-bit file may end in a palette; written 5
-//        2    1  encoding, written 1; not read: data are always run-length coded
+//        1    1  version; 3: the fixed sixteen colors; from 5 on an 8-bit file may end in a
+//        palette; written 5 2    1  encoding, written 1; not read: data are always run-length coded
 //        3    1  bits per pixel and plane
 //        4    8  xmin, ymin, xmax, ymax, the corners; written 0, 0, width - 1, height - 1
 //       12    4  two resolutions, written 300
@@ -16,12 +16,13 @@
 //      128       lines from the top, each with its planes one after the other
 //   end - 769    12 and a palette of 256 colors, with 8 bits
 //
-// Palettes are red, green, blue. A byte of 0xC0 or more counts in its low six bits how often the byte after it comes;
-// any other byte stands for itself.
+// Palettes are red, green, blue. A byte of 0xC0 or more counts in its low six bits how often the
+// byte after it comes; any other byte stands for itself.
 //
-// The reader carries runs on from line to line, and takes two bits in one plane (CGA) beside the combinations that it
-// writes. The writer codes every plane of every line on its own, and leaves the last byte of a run to the token after
-// it. Source: ZSoft Corporation, "PCX Technical Reference Manual" (1991).
+// The reader carries runs on from line to line, and takes two bits in one plane (CGA) beside the
+// combinations that it writes. The writer codes every plane of every line on its own, and leaves
+// the last byte of a run to the token after it. Source: ZSoft Corporation, "PCX Technical Reference
+// Manual" (1991).
 #include "formats/pcx/pcx.h"
 
 #include <algorithm>
@@ -64,9 +65,10 @@ struct PcxHeader {
   size_t LineSize() const { return size_t{bytesPerLine} * planes; }
 };
 
-// Turns a decoded line of `header.LineSize()` bytes into a whole row of the picture, padding included. Pixels that the
-// line does not hold become 0.
-using SpreadRow = void (*)(std::span<const uint8_t> line, const PcxHeader& header, std::span<uint8_t> row);
+// Turns a decoded line of `header.LineSize()` bytes into a whole row of the picture, padding
+// included. Pixels that the line does not hold become 0.
+using SpreadRow = void (*)(std::span<const uint8_t> line, const PcxHeader& header,
+                           std::span<uint8_t> row);
 
 void CopyRow(std::span<const uint8_t> line, const PcxHeader&, std::span<uint8_t> row) {
   const size_t count = std::min(line.size(), row.size());
@@ -75,7 +77,8 @@ void CopyRow(std::span<const uint8_t> line, const PcxHeader&, std::span<uint8_t>
 }
 
 // One bit of each of 2 to 4 planes makes a 4-bit pixel, the first plane its lowest bit.
-void SpreadBitPlanes(std::span<const uint8_t> line, const PcxHeader& header, std::span<uint8_t> row) {
+void SpreadBitPlanes(std::span<const uint8_t> line, const PcxHeader& header,
+                     std::span<uint8_t> row) {
   const size_t count = static_cast<size_t>(std::min(header.width, header.bytesPerLine * 8));
   std::memset(row.data(), 0, row.size());
   MergeBitPlanes(line.data(), count, header.planes, header.bytesPerLine, row.data());
@@ -92,7 +95,8 @@ void SpreadPairs(std::span<const uint8_t> line, const PcxHeader& header, std::sp
 }
 
 // A red, a green and a blue plane become pixels of blue, green, red.
-void MergeColorPlanes(std::span<const uint8_t> line, const PcxHeader& header, std::span<uint8_t> row) {
+void MergeColorPlanes(std::span<const uint8_t> line, const PcxHeader& header,
+                      std::span<uint8_t> row) {
   const size_t count = std::min<size_t>(header.width, header.bytesPerLine);
   const uint8_t* red = line.data();
   const uint8_t* green = red + header.bytesPerLine;
@@ -148,14 +152,15 @@ Status ParseHeader(std::span<const uint8_t> file, PcxHeader& header) {
   header.bytesPerLine = bytes.Le16();
   bytes.Seek(kHeaderSize);
   const bool sizesValid = header.width > 0 && header.height > 0 && header.bytesPerLine > 0;
-  const bool valid = bytes.Ok() && manufacturer == kManufacturer && sizesValid && FindArrangement(header) != nullptr;
+  const bool valid = bytes.Ok() && manufacturer == kManufacturer && sizesValid &&
+                     FindArrangement(header) != nullptr;
   return valid ? Status::Ok : Status::DamagedFile;
 }
 
-// Fills `palette` with what the header's version and depth call for. FileReadError when a palette at the end is there
-// but cannot be read.
-Status ReadPalette(const platform::FileView& file, const PcxPlace& place, const PcxHeader& header, int32_t depth,
-                   Palette& palette) {
+// Fills `palette` with what the header's version and depth call for. FileReadError when a palette
+// at the end is there but cannot be read.
+Status ReadPalette(const platform::FileView& file, const PcxPlace& place, const PcxHeader& header,
+                   int32_t depth, Palette& palette) {
   MakeDefaultPalette(&palette, nullptr, depth == 24 ? kDisplayPalette : kBlackAndWhitePalette);
   if (depth == 1 || depth == 24) return Status::Ok;
   if (depth == 8 && header.version >= kVersionTrailer && place.Size() >= kTrailerSize) {
@@ -172,17 +177,20 @@ Status ReadPalette(const platform::FileView& file, const PcxPlace& place, const 
 }
 
 // Parses the header and fills the record's facts.
-Status DescribePicture(const platform::FileView& file, const PcxPlace& place, PictureRecord& picture, PcxHeader& header) {
+Status DescribePicture(const platform::FileView& file, const PcxPlace& place,
+                       PictureRecord& picture, PcxHeader& header) {
   picture.typeName.Clear();
   picture.fileSize = file.FileSize();
   std::array<uint8_t, kHeaderSize> bytes;
-  const auto head = std::span(bytes).first(static_cast<size_t>(std::min(place.Size(), kHeaderSize)));
+  const auto head =
+      std::span(bytes).first(static_cast<size_t>(std::min(place.Size(), kHeaderSize)));
   if (!file.ReadAt(place.begin, head)) return Status::FileReadError;
   RETURN_IF_BAD(ParseHeader(head, header));
   picture.width = header.width;
   picture.height = header.height;
   picture.bitsPerPixel = FindArrangement(header)->depth;
-  picture.imageBytes = (picture.bitsPerPixel == 24 ? header.LineSize() : header.bytesPerLine) * uint64_t(header.height);
+  picture.imageBytes = (picture.bitsPerPixel == 24 ? header.LineSize() : header.bytesPerLine) *
+                       uint64_t(header.height);
   picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
   return ReadPalette(file, place, header, picture.bitsPerPixel, picture.palette);
 }
@@ -201,9 +209,12 @@ Status ChooseLayout(const PictureRecord& picture, PcxLayout& layout) {
   const bool planar = image.Bits() == 4 && picture.bitsPerPixel >= 2 && picture.bitsPerPixel <= 4;
   layout.depth = planar ? picture.bitsPerPixel : image.Bits();
   layout.bitsPerPlane = layout.depth <= 4 ? 1 : 8;
-  layout.planes = static_cast<uint8_t>(layout.depth == 24 ? 3 : layout.depth <= 4 ? layout.depth : 1);
+  layout.planes = static_cast<uint8_t>(layout.depth == 24  ? 3
+                                       : layout.depth <= 4 ? layout.depth
+                                                           : 1);
   const int32_t bytesPerLine = layout.depth <= 4 ? (image.Width() + 7) / 8 : image.Width();
-  if (bytesPerLine > UINT16_MAX || image.Width() - 1 > UINT16_MAX || image.Height() - 1 > UINT16_MAX) {
+  if (bytesPerLine > UINT16_MAX || image.Width() - 1 > UINT16_MAX ||
+      image.Height() - 1 > UINT16_MAX) {
     return Status::UnsuitableImage;
   }
   layout.bytesPerLine = static_cast<uint16_t>(bytesPerLine);
@@ -229,30 +240,38 @@ void WriteHeader(ByteWriter& out, const PcxLayout& layout, const PictureRecord& 
 }
 
 // Takes the planes of a row apart, `bytesPerLine` bytes each, one after the other.
-using TakePlanes = void (*)(std::span<const uint8_t> row, int32_t width, const PcxLayout& layout, std::span<uint8_t> planes);
+using TakePlanes = void (*)(std::span<const uint8_t> row, int32_t width, const PcxLayout& layout,
+                            std::span<uint8_t> planes);
 
 void TakePlane(std::span<const uint8_t> row, int32_t, const PcxLayout&, std::span<uint8_t> planes) {
   std::copy_n(row.begin(), planes.size(), planes.begin());
 }
 
-void TakeBitPlanes(std::span<const uint8_t> row, int32_t width, const PcxLayout& layout, std::span<uint8_t> planes) {
-  SplitBitPlanes(row.data(), static_cast<size_t>(width), layout.planes, layout.bytesPerLine, planes.data());
+void TakeBitPlanes(std::span<const uint8_t> row, int32_t width, const PcxLayout& layout,
+                   std::span<uint8_t> planes) {
+  SplitBitPlanes(row.data(), static_cast<size_t>(width), layout.planes, layout.bytesPerLine,
+                 planes.data());
 }
 
-void TakeColorPlanes(std::span<const uint8_t> row, int32_t width, const PcxLayout&, std::span<uint8_t> planes) {
+void TakeColorPlanes(std::span<const uint8_t> row, int32_t width, const PcxLayout&,
+                     std::span<uint8_t> planes) {
   const size_t count = static_cast<size_t>(width);
   uint8_t* red = planes.data();
   SplitColors(row.data(), count, red + 2 * count, red + count, red);
 }
 
-Status WriteLines(ByteWriter& out, const PcxLayout& layout, const PictureRecord& picture, std::span<uint8_t> planes) {
+Status WriteLines(ByteWriter& out, const PcxLayout& layout, const PictureRecord& picture,
+                  std::span<uint8_t> planes) {
   const PackedImage& image = picture.image;
-  const TakePlanes take = layout.depth == 24 ? TakeColorPlanes : layout.planes > 1 ? TakeBitPlanes : TakePlane;
+  const TakePlanes take = layout.depth == 24  ? TakeColorPlanes
+                          : layout.planes > 1 ? TakeBitPlanes
+                                              : TakePlane;
   for (int32_t y = 0; y < image.Height() && !out.Failed(); ++y) {
     RETURN_IF_BAD(picture.ReportRow(y));
     take(image.Row(y), image.Width(), layout, planes);
     for (size_t begin = 0; begin < planes.size(); begin += layout.bytesPerLine) {
-      out.Used(EncodePcxPlane(planes.subspan(begin, layout.bytesPerLine), out.Reserve(2 * size_t{layout.bytesPerLine})));
+      out.Used(EncodePcxPlane(planes.subspan(begin, layout.bytesPerLine),
+                              out.Reserve(2 * size_t{layout.bytesPerLine})));
     }
   }
   return Status::Ok;
@@ -270,12 +289,14 @@ Status ReadPcx(platform::FileView& file, const PcxPlace& place, PictureRecord& p
   RETURN_IF_BAD(DescribePicture(file, place, picture, header));
   PackedImage image;
   platform::MemoryBlock line;
-  RETURN_IF_BAD(
-      NewPackedImage(picture.width, picture.height, &picture.palette, picture.bitsPerPixel, image, platform::Fill::Unset));
-  if (!line.Allocate(header.LineSize() + PcxLineDecoder::kSlack)) return Status::MemoryAllocationError;
+  RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette,
+                               picture.bitsPerPixel, image, platform::Fill::Unset));
+  if (!line.Allocate(header.LineSize() + PcxLineDecoder::kSlack))
+    return Status::MemoryAllocationError;
   const SpreadRow spread = FindArrangement(header)->spread;
   const std::span<const uint8_t> decoded = line.Bytes().first(header.LineSize());
-  PcxLineDecoder decoder(file.Bytes().subspan(place.begin + kHeaderSize, place.Size() - kHeaderSize));
+  PcxLineDecoder decoder(
+      file.Bytes().subspan(place.begin + kHeaderSize, place.Size() - kHeaderSize));
   for (int32_t y = 0; y < header.height; ++y) {
     if (!decoder.Decode(line.Data(), header.LineSize())) return Status::FileReadError;
     spread(decoded, header, image.Row(y));
@@ -291,7 +312,8 @@ Status WritePcx(ByteWriter& out, const PictureRecord& picture) {
   PcxLayout layout;
   RETURN_IF_BAD(ChooseLayout(picture, layout));
   platform::MemoryBlock planes;
-  if (!planes.Allocate(uint64_t{layout.bytesPerLine} * layout.planes)) return Status::MemoryAllocationError;
+  if (!planes.Allocate(uint64_t{layout.bytesPerLine} * layout.planes))
+    return Status::MemoryAllocationError;
   WriteHeader(out, layout, picture);
   RETURN_IF_BAD(WriteLines(out, layout, picture, planes.Bytes()));
   if (layout.depth == 8) {

@@ -8,18 +8,18 @@ namespace fotomill {
 
 // PC Paintbrush. How a file lies on disk, and what is peculiar to this codec, stands in pcx.cpp.
 
-// Fills the facts of `picture`: size, depth, palette. Ok, FileOpenError; DamagedFile for a short header, another
-// signature, an unknown arrangement of planes, or a size that leaves nothing to decode; FileReadError when a palette at
-// the end cannot be read.
+// Fills the facts of `picture`: size, depth, palette. Ok, FileOpenError; DamagedFile for a short
+// header, another signature, an unknown arrangement of planes, or a size that leaves nothing to
+// decode; FileReadError when a palette at the end cannot be read.
 Status PcxInfo(PictureRecord& picture, const ReadRequest& request);
 
-// Fills the facts and decodes the pixels into `image`. Statuses of PcxInfo; FileReadError when the data end early;
-// MemoryAllocationError.
+// Fills the facts and decodes the pixels into `image`. Statuses of PcxInfo; FileReadError when the
+// data end early; MemoryAllocationError.
 Status PcxRead(PictureRecord& picture, const ReadRequest& request);
 
-// Writes `image` to picture.fileName as a version 5 file; pictures of 2 to 4 bits in as many planes. Ok;
-// MemoryAllocationError when there is no image; UnsuitableImage when a size does not fit the header's fields;
-// ErrorCreatingFile, ErrorWritingFile.
+// Writes `image` to picture.fileName as a version 5 file; pictures of 2 to 4 bits in as many
+// planes. Ok; MemoryAllocationError when there is no image; UnsuitableImage when a size does not
+// fit the header's fields; ErrorCreatingFile, ErrorWritingFile.
 Status PcxWrite(PictureRecord& picture, const WriteOptions& options);
 
 }  // namespace fotomill

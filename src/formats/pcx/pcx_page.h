@@ -9,14 +9,16 @@
 
 namespace fotomill {
 
-// Where a PCX picture lies in a file: all of it, or a page among others. Within the file, `begin` not behind `end`.
+// Where a PCX picture lies in a file: all of it, or a page among others. Within the file, `begin`
+// not behind `end`.
 struct PcxPlace {
   uint64_t begin = 0, end = 0;
   uint64_t Size() const { return end - begin; }  // bytes
 };
 
-// The work of the operations of pcx.h on a part of a file, with their statuses. DescribePcx needs no more of the file to be
-// visible than its first byte. ReadPcx leaves `image` alone unless it succeeds.
+// The work of the operations of pcx.h on a part of a file, with their statuses. DescribePcx needs
+// no more of the file to be visible than its first byte. ReadPcx leaves `image` alone unless it
+// succeeds.
 Status DescribePcx(const platform::FileView& file, const PcxPlace& place, PictureRecord& picture);
 Status ReadPcx(platform::FileView& file, const PcxPlace& place, PictureRecord& picture);
 // Writes the picture at the writer's position; the commit is the caller's.

@@ -18,8 +18,9 @@ constexpr size_t kLongestRun = 63;
 constexpr int kManyMarks = 10;  // among 64 bytes, so that taking them out at once pays
 #endif
 
-// Both directions walk over their data with this state. The fast walks stop where too little is left for them, and give
-// back how far they came; by value, so that the state stays in registers while bytes are stored.
+// Both directions walk over their data with this state. The fast walks stop where too little is
+// left for them, and give back how far they came; by value, so that the state stays in registers
+// while bytes are stored.
 struct Walk {
   const uint8_t* from;
   const uint8_t* fromEnd;
@@ -39,21 +40,32 @@ inline uint8_t* PutRun(uint8_t* to, size_t count, uint8_t value) {
 
 #ifdef BYTE_SHUFFLE
 
-BYTE_SHUFFLE __m128i Load(const uint8_t* bytes) { return _mm_loadu_si128(reinterpret_cast<const __m128i*>(bytes)); }
-BYTE_SHUFFLE __m128i Load8(const uint8_t* bytes) { return _mm_loadl_epi64(reinterpret_cast<const __m128i*>(bytes)); }
-BYTE_SHUFFLE void Store(uint8_t* bytes, __m128i value) { _mm_storeu_si128(reinterpret_cast<__m128i*>(bytes), value); }
-BYTE_SHUFFLE void Store8(uint8_t* bytes, __m128i value) { _mm_storel_epi64(reinterpret_cast<__m128i*>(bytes), value); }
+BYTE_SHUFFLE __m128i Load(const uint8_t* bytes) {
+  return _mm_loadu_si128(reinterpret_cast<const __m128i*>(bytes));
+}
+BYTE_SHUFFLE __m128i Load8(const uint8_t* bytes) {
+  return _mm_loadl_epi64(reinterpret_cast<const __m128i*>(bytes));
+}
+BYTE_SHUFFLE void Store(uint8_t* bytes, __m128i value) {
+  _mm_storeu_si128(reinterpret_cast<__m128i*>(bytes), value);
+}
+BYTE_SHUFFLE void Store8(uint8_t* bytes, __m128i value) {
+  _mm_storel_epi64(reinterpret_cast<__m128i*>(bytes), value);
+}
 
 // One bit for each of sixteen bytes: whether it is a mark, or equals another.
 BYTE_SHUFFLE uint32_t Marks(__m128i bytes) {
   const __m128i mark = _mm_set1_epi8(static_cast<char>(kMark));
   return static_cast<uint32_t>(_mm_movemask_epi8(_mm_cmpeq_epi8(_mm_max_epu8(bytes, mark), bytes)));
 }
-BYTE_SHUFFLE uint32_t Equal(__m128i a, __m128i b) { return static_cast<uint32_t>(_mm_movemask_epi8(_mm_cmpeq_epi8(a, b))); }
+BYTE_SHUFFLE uint32_t Equal(__m128i a, __m128i b) {
+  return static_cast<uint32_t>(_mm_movemask_epi8(_mm_cmpeq_epi8(a, b)));
+}
 
 using ShuffleTable = std::array<std::array<uint8_t, 16>, 256>;
 
-// For each set of flagged bytes among eight: every byte, with the ninth byte of the register before each flagged one.
+// For each set of flagged bytes among eight: every byte, with the ninth byte of the register before
+// each flagged one.
 constexpr ShuffleTable MakeInsertions() {
   ShuffleTable table{};
   for (size_t flags = 0; flags < table.size(); ++flags) {
@@ -82,12 +94,16 @@ alignas(16) constexpr ShuffleTable kInsertions = MakeInsertions();
 alignas(16) constexpr ShuffleTable kRemovals = MakeRemovals();
 
 BYTE_SHUFFLE __m128i Shuffle(__m128i bytes, const ShuffleTable& table, uint32_t flags) {
-  return _mm_shuffle_epi8(bytes, _mm_load_si128(reinterpret_cast<const __m128i*>(table[flags].data())));
+  return _mm_shuffle_epi8(bytes,
+                          _mm_load_si128(reinterpret_cast<const __m128i*>(table[flags].data())));
 }
 
-// Writes the first `count` of eight bytes, a single mark before each flagged one. Sixteen bytes of `to` may change.
-BYTE_SHUFFLE uint8_t* PutSingles(uint8_t* to, const uint8_t* bytes, uint32_t count, uint32_t flags) {
-  const __m128i marked = _mm_unpacklo_epi64(Load8(bytes), _mm_set1_epi8(static_cast<char>(kSingle)));
+// Writes the first `count` of eight bytes, a single mark before each flagged one. Sixteen bytes of
+// `to` may change.
+BYTE_SHUFFLE uint8_t* PutSingles(uint8_t* to, const uint8_t* bytes, uint32_t count,
+                                 uint32_t flags) {
+  const __m128i marked =
+      _mm_unpacklo_epi64(Load8(bytes), _mm_set1_epi8(static_cast<char>(kSingle)));
   Store(to, Shuffle(marked, kInsertions, flags & 0xFF));
   return to + count + static_cast<uint32_t>(std::popcount(flags & ((1u << count) - 1)));
 }
@@ -98,14 +114,16 @@ BYTE_SHUFFLE size_t CountEqual(const uint8_t* from, const uint8_t* end) {
   const uint8_t* next = from + 1;
   for (; end - next >= 16; next += 16) {
     const uint32_t other = Equal(Load(next), value) ^ 0xFFFF;
-    if (other != 0) return static_cast<size_t>(next - from) - 1 + static_cast<size_t>(std::countr_zero(other));
+    if (other != 0)
+      return static_cast<size_t>(next - from) - 1 + static_cast<size_t>(std::countr_zero(other));
   }
   while (next < end && *next == *from) ++next;
   return static_cast<size_t>(next - from) - 1;
 }
 
-// Sixteen bytes at a time. A byte that equals the next is coded like a single byte with a mark, unless the next one
-// equals its neighbour as well: only three equal bytes make a run that needs counting.
+// Sixteen bytes at a time. A byte that equals the next is coded like a single byte with a mark,
+// unless the next one equals its neighbour as well: only three equal bytes make a run that needs
+// counting.
 BYTE_SHUFFLE Walk EncodeFast(Walk walk) {
   while (walk.fromEnd - walk.from >= 18) {
     const __m128i bytes = Load(walk.from);
@@ -113,7 +131,8 @@ BYTE_SHUFFLE Walk EncodeFast(Walk walk) {
     const uint32_t equal = Equal(bytes, Load(walk.from + 1)) | last;
     const uint32_t flags = (equal & 0xFFFF) | Marks(bytes);
     const uint32_t runs = equal & equal >> 1;
-    const uint32_t count = runs == 0 ? 16 : static_cast<uint32_t>(std::countr_zero(runs));  // bytes before a run
+    // bytes before a run
+    const uint32_t count = runs == 0 ? 16 : static_cast<uint32_t>(std::countr_zero(runs));
     if (flags == 0) {
       Store(walk.to, bytes);
       walk.to += 16;
@@ -131,8 +150,9 @@ BYTE_SHUFFLE Walk EncodeFast(Walk walk) {
   return walk;
 }
 
-// Which of 64 bytes are marks, given those of 0xC0 or more: of such bytes in a row every other one, beginning with the
-// first, since a mark makes a plain byte of the one after it. Subtracting runs a carry through each row.
+// Which of 64 bytes are marks, given those of 0xC0 or more: of such bytes in a row every other one,
+// beginning with the first, since a mark makes a plain byte of the one after it. Subtracting runs a
+// carry through each row.
 constexpr uint64_t MarksAmong(uint64_t candidates) {
   constexpr uint64_t kOdd = 0xAAAAAAAAAAAAAAAA;
   return (((candidates << 1 | kOdd) - candidates) ^ kOdd) & candidates;
@@ -152,8 +172,8 @@ BYTE_SHUFFLE void FillShort(uint8_t* to, uint8_t value, size_t count) {
   for (size_t i = 16; i < count; i += 16) Store(to + i, bytes);
 }
 
-// Decodes the tokens that begin in the 64 bytes at walk.from, given where their marks are, one by one, and moves past
-// them. False at a token that reaches beyond the line.
+// Decodes the tokens that begin in the 64 bytes at walk.from, given where their marks are, one by
+// one, and moves past them. False at a token that reaches beyond the line.
 BYTE_SHUFFLE bool DecodeTokens(Walk& walk, uint64_t marks, const uint8_t* lineEnd) {
   const uint8_t* const block = walk.from;
   const uint8_t* const blockEnd = block + 64;
@@ -179,12 +199,13 @@ BYTE_SHUFFLE bool DecodeTokens(Walk& walk, uint64_t marks, const uint8_t* lineEn
 BYTE_SHUFFLE bool AllSingle(const uint8_t* bytes, uint64_t marks) {
   const __m128i single = _mm_set1_epi8(static_cast<char>(kSingle));
   uint64_t singles = 0;
-  for (unsigned i = 0; i < 64; i += 16) singles |= static_cast<uint64_t>(Equal(Load(bytes + i), single)) << i;
+  for (unsigned i = 0; i < 64; i += 16)
+    singles |= static_cast<uint64_t>(Equal(Load(bytes + i), single)) << i;
   return (marks & ~singles) == 0;
 }
 
-// Decodes 64 bytes all of whose marks are those of single bytes: they are left out, eight bytes at a time. The line has
-// room for what comes of them. A mark at the end stays for the next time.
+// Decodes 64 bytes all of whose marks are those of single bytes: they are left out, eight bytes at
+// a time. The line has room for what comes of them. A mark at the end stays for the next time.
 BYTE_SHUFFLE void DecodeSingles(Walk& walk, uint64_t marks) {
   for (unsigned i = 0; i < 64; i += 8) {
     const uint32_t flags = static_cast<uint32_t>(marks >> i & 0xFF);
@@ -194,8 +215,8 @@ BYTE_SHUFFLE void DecodeSingles(Walk& walk, uint64_t marks) {
   walk.from += 64 - (marks >> 63);
 }
 
-// Decodes 64 bytes at a time into a line, as far as its end or the end of the data is not near. Up to 64 bytes behind
-// the line may change.
+// Decodes 64 bytes at a time into a line, as far as its end or the end of the data is not near. Up
+// to 64 bytes behind the line may change.
 BYTE_SHUFFLE Walk DecodeFast(Walk walk, const uint8_t* lineEnd) {
   while (walk.fromEnd - walk.from >= 128) {
     if (*walk.from > kSingle) {  // a run here is mostly one of many
@@ -207,9 +228,11 @@ BYTE_SHUFFLE Walk DecodeFast(Walk walk, const uint8_t* lineEnd) {
       continue;
     }
     uint64_t candidates = 0;
-    for (unsigned i = 0; i < 64; i += 16) candidates |= static_cast<uint64_t>(Marks(Load(walk.from + i))) << i;
+    for (unsigned i = 0; i < 64; i += 16)
+      candidates |= static_cast<uint64_t>(Marks(Load(walk.from + i))) << i;
     const uint64_t marks = MarksAmong(candidates);
-    if (std::popcount(marks) >= kManyMarks && lineEnd - walk.to >= 64 && AllSingle(walk.from, marks)) {
+    if (std::popcount(marks) >= kManyMarks && lineEnd - walk.to >= 64 &&
+        AllSingle(walk.from, marks)) {
       DecodeSingles(walk, marks);
     } else if (!DecodeTokens(walk, marks, lineEnd)) {
       return walk;
@@ -240,7 +263,8 @@ bool PcxLineDecoder::Decode(uint8_t* line, size_t size) {
     }
     if (walk.from == walk.fromEnd) return false;
     value_ = *walk.from++;
-    const size_t count = byte & kLongestRun, now = std::min(count, static_cast<size_t>(lineEnd - walk.to));
+    const size_t count = byte & kLongestRun,
+                 now = std::min(count, static_cast<size_t>(lineEnd - walk.to));
     std::memset(walk.to, value_, now);
     walk.to += now;
     pending_ = count - now;

@@ -1,12 +1,14 @@
 // Photoshop documents (PSD, PDD): their pictures. How a file is laid out is told in psd_file.cpp.
 //
-// The reader shows the merged picture. Where the program stored none, each layer that holds pixels is a page, from the
-// bottom up, in its place on the canvas. Bitmap, gray, indexed, RGB, CMYK, Lab; duotone as the gray that it is made of;
-// multichannel as gray, or as the inks cyan, magenta, yellow and black where it has so many. Samples of 16 bits come down
-// to 8. Inks become sRGB by the embedded profile, else by the usual formula.
+// The reader shows the merged picture. Where the program stored none, each layer that holds pixels
+// is a page, from the bottom up, in its place on the canvas. Bitmap, gray, indexed, RGB, CMYK, Lab;
+// duotone as the gray that it is made of; multichannel as gray, or as the inks cyan, magenta,
+// yellow and black where it has so many. Samples of 16 bits come down to 8. Inks become sRGB by the
+// embedded profile, else by the usual formula.
 //
-// The channel behind those of the mode is alpha, unless the file has layers and says that the merged picture is opaque, or
-// calls it a spot color. Where it is the opacity of the merged picture, whose colors then lie on white, they are taken off it.
+// The channel behind those of the mode is alpha, unless the file has layers and says that the
+// merged picture is opaque, or calls it a spot color. Where it is the opacity of the merged
+// picture, whose colors then lie on white, they are taken off it.
 #include "formats/photoshop/psd.h"
 
 #include <algorithm>
@@ -45,8 +47,10 @@ bool ShowsLayers(const PsdFile& document) {
 
 // Whether the merged picture's channel behind those of the mode is alpha.
 bool MergedHasAlpha(const PsdFile& document) {
-  if (document.header.mode == PsdMode::Bitmap || document.header.mode == PsdMode::Multichannel) return false;
-  if (document.header.channels <= PsdColorChannels(document.header) || document.firstExtraIsInk) return false;
+  if (document.header.mode == PsdMode::Bitmap || document.header.mode == PsdMode::Multichannel)
+    return false;
+  if (document.header.channels <= PsdColorChannels(document.header) || document.firstExtraIsInk)
+    return false;
   return document.mergedHasOpacity || document.layerCount == 0;
 }
 
@@ -76,7 +80,8 @@ void CopyBlock(std::span<const uint8_t> block, std::vector<uint8_t>& into) {
 
 // Pixels that an ink or Lab picture becomes are sRGB: its profile stays behind.
 bool KeepsProfile(const PsdHeader& header) {
-  return header.mode == PsdMode::Gray || header.mode == PsdMode::Indexed || header.mode == PsdMode::Rgb;
+  return header.mode == PsdMode::Gray || header.mode == PsdMode::Indexed ||
+         header.mode == PsdMode::Rgb;
 }
 
 // Ok, or NoImages when there is nothing to show.
@@ -88,8 +93,10 @@ Status DescribePicture(const PsdFile& document, PictureRecord& picture) {
   picture.bitsPerPixel = BitsOf(header);
   picture.imageBytes = EstimateImageBytes(picture.width, picture.height, picture.bitsPerPixel);
   picture.pageCount = ShowsLayers(document) ? static_cast<int32_t>(document.layers.size()) : 1;
-  picture.alphaFlags = static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (HasAlpha(document) ? kHasAlpha : 0));
-  picture.simplified = header.depth == 16 || document.layerCount > 0 || header.channels > 4 || !KeepsProfile(header);
+  picture.alphaFlags = static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) |
+                                            (HasAlpha(document) ? kHasAlpha : 0));
+  picture.simplified =
+      header.depth == 16 || document.layerCount > 0 || header.channels > 4 || !KeepsProfile(header);
   if (picture.bitsPerPixel == 24) {
     MakeDefaultPalette(&picture.palette, nullptr, kDisplayPalette);
   } else {
@@ -106,10 +113,13 @@ Status DescribePicture(const PsdFile& document, PictureRecord& picture) {
 // Makes rows of the picture out of rows of its channels.
 class RowMaker {
  public:
-  RowMaker(const PsdFile& document, size_t width) : width_(width), channels_(PsdColorChannels(document.header)) {
+  RowMaker(const PsdFile& document, size_t width)
+      : width_(width), channels_(PsdColorChannels(document.header)) {
     const PsdMode mode = document.header.mode;
-    if (mode == PsdMode::Lab) ink_ = std::make_unique<InkTransform>(InkTransform::Kind::Lab, std::span<const uint8_t>());
-    if (mode == PsdMode::Cmyk || channels_ == 4) ink_ = std::make_unique<InkTransform>(InkTransform::Kind::Cmyk, document.icc);
+    if (mode == PsdMode::Lab)
+      ink_ = std::make_unique<InkTransform>(InkTransform::Kind::Lab, std::span<const uint8_t>());
+    if (mode == PsdMode::Cmyk || channels_ == 4)
+      ink_ = std::make_unique<InkTransform>(InkTransform::Kind::Cmyk, document.icc);
     if (channels_ > 1) samples_.resize(channels_ * width);
     if (ink_ != nullptr) mixed_.resize(channels_ * width);
   }
@@ -131,7 +141,9 @@ class RowMaker {
   }
 
  private:
-  std::span<uint8_t> Samples(size_t channel) { return std::span(samples_).subspan(channel * width_, width_); }
+  std::span<uint8_t> Samples(size_t channel) {
+    return std::span(samples_).subspan(channel * width_, width_);
+  }
 
   const size_t width_;
   const size_t channels_;
@@ -152,19 +164,23 @@ void TakeOffWhite(std::span<const uint8_t> alpha, size_t samples, std::span<uint
   }
 }
 
-Status NewPlanes(const PsdFile& document, const PictureRecord& picture, PackedImage& image, PackedImage& alpha) {
+Status NewPlanes(const PsdFile& document, const PictureRecord& picture, PackedImage& image,
+                 PackedImage& alpha) {
   RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette, picture.bitsPerPixel, image));
   return HasAlpha(document) ? NewAlphaPlane(picture.width, picture.height, alpha) : Status::Ok;
 }
 
-Status ReadMerged(const PsdFile& document, const PictureRecord& picture, PackedImage& image, PackedImage& alpha) {
+Status ReadMerged(const PsdFile& document, const PictureRecord& picture, PackedImage& image,
+                  PackedImage& alpha) {
   const PsdHeader& header = document.header;
   const auto width = static_cast<size_t>(header.width);
   const size_t colors = PsdColorChannels(header);
   PsdPlanes planes;
   RETURN_IF_BAD(planes.Open(document.merged, header, header.width, header.height, header.channels));
   RETURN_IF_BAD(NewPlanes(document, picture, image, alpha));
-  const size_t bytes = image.Bits() == 1 ? header.RowSize(width) : image.Bits() == 24 ? 3 * width : width;
+  const size_t bytes = image.Bits() == 1    ? header.RowSize(width)
+                       : image.Bits() == 24 ? 3 * width
+                                            : width;
   std::vector<PsdPlane*> ofColors;
   for (size_t c = 0; c < colors; ++c) ofColors.push_back(&planes[c]);
   RowMaker maker(document, width);
@@ -176,7 +192,8 @@ Status ReadMerged(const PsdFile& document, const PictureRecord& picture, PackedI
       RETURN_IF_BAD(planes[colors].Next(opacity));
       if (document.mergedHasOpacity) TakeOffWhite(opacity, bytes / width, row);
     } else if (document.transparentIndex >= 0) {
-      for (size_t x = 0; x < width; ++x) alpha.Row(y)[x] = row[x] == document.transparentIndex ? 0 : 255;
+      for (size_t x = 0; x < width; ++x)
+        alpha.Row(y)[x] = row[x] == document.transparentIndex ? 0 : 255;
     }
     RETURN_IF_BAD(picture.ReportRow(y));
   }
@@ -184,16 +201,19 @@ Status ReadMerged(const PsdFile& document, const PictureRecord& picture, PackedI
 }
 
 // Copies the part of a layer's row that lies on the canvas.
-void PlaceRow(std::span<const uint8_t> row, int32_t left, int32_t canvasWidth, std::span<uint8_t> target) {
+void PlaceRow(std::span<const uint8_t> row, int32_t left, int32_t canvasWidth,
+              std::span<uint8_t> target) {
   const auto bytes = static_cast<int64_t>(target.size()) / canvasWidth;
   const int64_t first = std::max<int64_t>(0, -int64_t{left});
-  const int64_t end = std::min<int64_t>(static_cast<int64_t>(row.size()) / bytes, int64_t{canvasWidth} - left);
+  const int64_t end =
+      std::min<int64_t>(static_cast<int64_t>(row.size()) / bytes, int64_t{canvasWidth} - left);
   if (first >= end) return;
-  std::copy(row.begin() + first * bytes, row.begin() + end * bytes, target.begin() + (first + left) * bytes);
+  std::copy(row.begin() + first * bytes, row.begin() + end * bytes,
+            target.begin() + (first + left) * bytes);
 }
 
-Status ReadLayer(const PsdFile& document, const PsdLayer& layer, const PictureRecord& picture, PackedImage& image,
-                 PackedImage& alpha) {
+Status ReadLayer(const PsdFile& document, const PsdLayer& layer, const PictureRecord& picture,
+                 PackedImage& image, PackedImage& alpha) {
   const PsdHeader& header = document.header;
   const int32_t width = layer.right - layer.left, height = layer.bottom - layer.top;
   const size_t colors = PsdColorChannels(header), samples = picture.bitsPerPixel == 24 ? 3 : 1;
@@ -206,10 +226,12 @@ Status ReadLayer(const PsdFile& document, const PsdLayer& layer, const PictureRe
     ofColors.push_back(&planes[c][0]);
   }
   const PsdChannel* opacity = layer.Channel(kPsdTransparency);
-  if (opacity != nullptr) RETURN_IF_BAD(planes[colors].Open(opacity->data, header, width, height, 1));
+  if (opacity != nullptr)
+    RETURN_IF_BAD(planes[colors].Open(opacity->data, header, width, height, 1));
   RETURN_IF_BAD(NewPlanes(document, picture, image, alpha));
   RowMaker maker(document, static_cast<size_t>(width));
-  std::vector<uint8_t> row(samples * static_cast<size_t>(width)), opacityRow(static_cast<size_t>(width), 255);
+  std::vector<uint8_t> row(samples * static_cast<size_t>(width)),
+      opacityRow(static_cast<size_t>(width), 255);
   const auto canvasWidth = static_cast<size_t>(header.width);
   for (int32_t i = 0; i < height; ++i) {
     RETURN_IF_BAD(picture.ReportRow(i, height));
@@ -218,13 +240,16 @@ Status ReadLayer(const PsdFile& document, const PsdLayer& layer, const PictureRe
     RETURN_IF_BAD(maker.Next(ofColors, row));
     if (opacity != nullptr) RETURN_IF_BAD(planes[colors][0].Next(opacityRow));
     if (y < 0) continue;
-    PlaceRow(row, layer.left, header.width, image.Row(static_cast<int32_t>(y)).first(samples * canvasWidth));
-    PlaceRow(opacityRow, layer.left, header.width, alpha.Row(static_cast<int32_t>(y)).first(canvasWidth));
+    PlaceRow(row, layer.left, header.width,
+             image.Row(static_cast<int32_t>(y)).first(samples * canvasWidth));
+    PlaceRow(opacityRow, layer.left, header.width,
+             alpha.Row(static_cast<int32_t>(y)).first(canvasWidth));
   }
   return Status::Ok;
 }
 
-Status OpenDocument(platform::FileView& file, const std::string& name, PsdFile& document, PictureRecord& picture) {
+Status OpenDocument(platform::FileView& file, const std::string& name, PsdFile& document,
+                    PictureRecord& picture) {
   if (!file.Open(name)) return Status::FileOpenError;
   picture.fileSize = file.FileSize();
   RETURN_IF_BAD(ParsePsd(file.Bytes(), document));
@@ -272,11 +297,13 @@ Status PsdDetails(PictureRecord& picture) {
   PsdFile document;
   RETURN_IF_BAD(OpenDocument(file, picture.fileName.c_str(), document, picture));
   DetailLines& lines = picture.detailLines;
-  lines.AddFormat("         Mode: %s, %u bits", ModeName(document.header), unsigned{document.header.depth});
+  lines.AddFormat("         Mode: %s, %u bits", ModeName(document.header),
+                  unsigned{document.header.depth});
   lines.AddFormat("     Channels: %u", unsigned{document.header.channels});
   lines.AddFormat("       Layers: %zu", document.layerCount);
   lines.AddFormat("  Compression: %s", CompressionName(document.merged));
-  if (document.dpiX > 0) lines.AddFormat("   Resolution: %.0f x %.0f dpi", document.dpiX, document.dpiY);
+  if (document.dpiX > 0)
+    lines.AddFormat("   Resolution: %.0f x %.0f dpi", document.dpiX, document.dpiY);
   if (!document.icc.empty()) lines.AddFormat("  ICC profile: %zu bytes", document.icc.size());
   if (!document.exif.empty()) lines.AddFormat("         EXIF: %zu bytes", document.exif.size());
   if (!document.xmp.empty()) lines.AddFormat("          XMP: %zu bytes", document.xmp.size());

@@ -8,22 +8,27 @@
 //       14    8  height, width
 //       22    2  bits of a sample: 1, 8, 16 or 32
 //       24    2  mode: 0 bitmap, 1 gray, 2 indexed, 3 RGB, 4 CMYK, 7 multichannel, 8 duotone, 9 Lab
-//       26    4  bytes of the color mode data, and these: the table of an indexed picture, 256 reds, greens and blues
-//        .    4  bytes of the resources, and these: "8BIM", number (2), a counted text of even length, bytes (4), data
+//       26    4  bytes of the color mode data, and these: the table of an indexed picture, 256
+//       reds, greens and blues
+//        .    4  bytes of the resources, and these: "8BIM", number (2), a counted text of even
+//        length, bytes (4), data
 //                padded to an even length
 //        .    4  bytes of the layers and masks, and these:
-//             4  bytes of the layers, and these: count (2), negative when the merged picture has opacity, then per layer
+//             4  bytes of the layers, and these: count (2), negative when the merged picture has
+//             opacity, then per layer
 //                  16  top, left, bottom, right
 //                   2  channels, then 6 bytes each: number (2), bytes of data (4)
 //                  12  "8BIM", blend mode (4), opacity, clipping, flags, nothing
 //                   4  bytes of further data, and these
 //                and the data of all channels of all layers
 //             4  bytes of the global mask, and these
-//                blocks: "8BIM" or "8B64", key (4), bytes (4), data padded to 4; "Lr16" holds the layers of 16 bits
-//        .       the merged picture: compression (2), rows of the first channel from the top, then of the next
+//                blocks: "8BIM" or "8B64", key (4), bytes (4), data padded to 4; "Lr16" holds the
+//                layers of 16 bits
+//        .       the merged picture: compression (2), rows of the first channel from the top, then
+//        of the next
 //
-// Compressions are 0 none, 1 PackBits with the bytes of all rows (2 each) in front, 2 deflate, 3 deflate of differences.
-// Source: Adobe, "Adobe Photoshop File Formats Specification" (2019).
+// Compressions are 0 none, 1 PackBits with the bytes of all rows (2 each) in front, 2 deflate, 3
+// deflate of differences. Source: Adobe, "Adobe Photoshop File Formats Specification" (2019).
 #include "formats/photoshop/psd_file.h"
 
 #include <algorithm>
@@ -49,14 +54,16 @@ Status CheckHeader(const PsdHeader& header) {
   if (header.depth != 1 && header.depth != 8 && header.depth != 16) return Status::DamagedFile;
   if (oneBit != (header.depth == 1)) return Status::DamagedFile;
   if (header.mode == PsdMode::Indexed && header.depth != 8) return Status::DamagedFile;
-  constexpr PsdMode kModes[] = {PsdMode::Bitmap, PsdMode::Gray,         PsdMode::Indexed, PsdMode::Rgb,
-                                PsdMode::Cmyk,   PsdMode::Multichannel, PsdMode::Duotone, PsdMode::Lab};
+  constexpr PsdMode kModes[] = {PsdMode::Bitmap,  PsdMode::Gray, PsdMode::Indexed,
+                                PsdMode::Rgb,     PsdMode::Cmyk, PsdMode::Multichannel,
+                                PsdMode::Duotone, PsdMode::Lab};
   if (std::ranges::find(kModes, header.mode) == std::end(kModes)) return Status::UnsupportedFormat;
   return header.channels < PsdColorChannels(header) ? Status::DamagedFile : Status::Ok;
 }
 
 Status ParseHeader(ByteReader& bytes, PsdHeader& header) {
-  if (!bytes.Match(kSignature)) return bytes.Size() < 4 ? Status::FileReadError : Status::DamagedFile;
+  if (!bytes.Match(kSignature))
+    return bytes.Size() < 4 ? Status::FileReadError : Status::DamagedFile;
   const uint16_t version = bytes.Be16();
   bytes.Skip(6);
   header.channels = bytes.Be16();
@@ -69,7 +76,8 @@ Status ParseHeader(ByteReader& bytes, PsdHeader& header) {
   return version == 1 ? CheckHeader(header) : Status::DamagedFile;
 }
 
-// Whether the first entry of a list of channel information is a spot color; entries have their kind at that offset.
+// Whether the first entry of a list of channel information is a spot color; entries have their kind
+// at that offset.
 bool FirstIsInk(std::span<const uint8_t> list, size_t kindOffset) {
   return list.size() > kindOffset && list[kindOffset] == kInkKind;
 }
@@ -93,7 +101,8 @@ void TakeResource(PsdResource number, std::span<const uint8_t> data, PsdFile& do
     case PsdResource::Xmp: document.xmp = data; return;
     case PsdResource::TransparentIndex: {
       const uint16_t index = bytes.Be16();
-      if (bytes.Ok() && index < 256 && document.header.mode == PsdMode::Indexed) document.transparentIndex = index;
+      if (bytes.Ok() && index < 256 && document.header.mode == PsdMode::Indexed)
+        document.transparentIndex = index;
       return;
     }
     case PsdResource::VersionInfo:
@@ -118,7 +127,8 @@ void ParseResources(std::span<const uint8_t> section, PsdFile& document) {
 }
 
 bool HoldsPixels(const PsdLayer& layer) {
-  const int64_t width = int64_t{layer.right} - layer.left, height = int64_t{layer.bottom} - layer.top;
+  const int64_t width = int64_t{layer.right} - layer.left,
+                height = int64_t{layer.bottom} - layer.top;
   return width > 0 && height > 0 && width <= kLongestLayerSide && height <= kLongestLayerSide;
 }
 
@@ -133,7 +143,8 @@ void ParseLayers(std::span<const uint8_t> section, PsdFile& document) {
   std::vector<std::vector<uint32_t>> sizes;
   for (size_t i = 0; i < document.layerCount; ++i) {
     PsdLayer layer;
-    for (int32_t* side : {&layer.top, &layer.left, &layer.bottom, &layer.right}) *side = static_cast<int32_t>(bytes.Be32());
+    for (int32_t* side : {&layer.top, &layer.left, &layer.bottom, &layer.right})
+      *side = static_cast<int32_t>(bytes.Be32());
     const uint16_t channels = bytes.Be16();
     if (!bytes.Ok() || channels > kMostChannels) return;
     std::vector<uint32_t> ofChannels;
@@ -148,10 +159,13 @@ void ParseLayers(std::span<const uint8_t> section, PsdFile& document) {
     sizes.push_back(std::move(ofChannels));
   }
   for (size_t i = 0; i < layers.size(); ++i) {
-    for (size_t c = 0; c < sizes[i].size(); ++c) layers[i].channels[c].data = bytes.Take(sizes[i][c]);
+    for (size_t c = 0; c < sizes[i].size(); ++c)
+      layers[i].channels[c].data = bytes.Take(sizes[i][c]);
   }
   if (!bytes.Ok()) return;
-  std::erase_if(layers, [](const PsdLayer& layer) { return !HoldsPixels(layer) || layer.Channel(0) == nullptr; });
+  std::erase_if(layers, [](const PsdLayer& layer) {
+    return !HoldsPixels(layer) || layer.Channel(0) == nullptr;
+  });
   document.layers = std::move(layers);
 }
 
@@ -194,7 +208,8 @@ uint16_t PsdColorChannels(const PsdHeader& header) {
     case PsdMode::Rgb:
     case PsdMode::Lab: return 3;
     case PsdMode::Cmyk: return 4;
-    case PsdMode::Multichannel: return header.channels < 3 ? 1 : std::min<uint16_t>(header.channels, 4);
+    case PsdMode::Multichannel:
+      return header.channels < 3 ? 1 : std::min<uint16_t>(header.channels, 4);
     default: return 1;
   }
 }
@@ -205,7 +220,8 @@ Status ParsePsd(std::span<const uint8_t> file, PsdFile& document) {
   document.colorTable = bytes.Take(bytes.Be32());
   const auto resources = bytes.Take(bytes.Be32());
   if (!bytes.Ok()) return Status::FileReadError;
-  if (document.header.mode == PsdMode::Indexed && document.colorTable.size() < kColorTableSize) return Status::DamagedFile;
+  if (document.header.mode == PsdMode::Indexed && document.colorTable.size() < kColorTableSize)
+    return Status::DamagedFile;
   ParseResources(resources, document);
   if (bytes.Left() == 0) return Status::Ok;  // a document without layers may end here
   const auto layers = bytes.Take(bytes.Be32());

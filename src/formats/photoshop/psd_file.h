@@ -10,10 +10,20 @@
 
 namespace fotomill {
 
-// What a Photoshop document holds, as views into the file. The layout of the file is told in psd_file.cpp.
+// What a Photoshop document holds, as views into the file. The layout of the file is told in
+// psd_file.cpp.
 
 // Color modes of a Photoshop file, by the numbers of its header.
-enum class PsdMode : uint16_t { Bitmap = 0, Gray = 1, Indexed = 2, Rgb = 3, Cmyk = 4, Multichannel = 7, Duotone = 8, Lab = 9 };
+enum class PsdMode : uint16_t {
+  Bitmap = 0,
+  Gray = 1,
+  Indexed = 2,
+  Rgb = 3,
+  Cmyk = 4,
+  Multichannel = 7,
+  Duotone = 8,
+  Lab = 9
+};
 
 // Numbers of the resources that matter here.
 enum class PsdResource : uint16_t {
@@ -61,16 +71,19 @@ struct PsdLayer {
 // The parts of a file.
 struct PsdFile {
   PsdHeader header;
-  std::span<const uint8_t> colorTable;  // of an indexed picture: 256 reds, then the greens, then the blues
+  // of an indexed picture: 256 reds, then the greens, then the blues
+  std::span<const uint8_t> colorTable;
   std::span<const uint8_t> icc, exif, xmp;
   double dpiX = 0, dpiY = 0;       // 0 when the file does not say
   int32_t transparentIndex = -1;   // of an indexed picture; -1 none
   bool firstExtraIsInk = false;    // the channel behind those of the mode is a spot color
   bool mergedIsReal = true;        // the program stored a picture of all layers, not an empty one
-  bool mergedHasOpacity = false;   // the channel behind those of the mode is its opacity, and its colors lie on white
+  // the channel behind those of the mode is its opacity, and its colors lie on white
+  bool mergedHasOpacity = false;
   size_t layerCount = 0;           // all that the file tells of
   std::vector<PsdLayer> layers;    // those that hold pixels, from the bottom up
-  std::span<const uint8_t> merged;  // a compression, 2 bytes, and the rows; empty when there is none
+  // a compression, 2 bytes, and the rows; empty when there is none
+  std::span<const uint8_t> merged;
 };
 
 // How many channels a picture of that mode is made of: 1, 3 or 4.

@@ -38,7 +38,8 @@ void SumRow(std::span<uint8_t> row, bool wide) {
 void NarrowPsdSamples(std::span<const uint8_t> wide, std::span<uint8_t> narrow) {
   const uint8_t* from = wide.data();
   for (size_t x = 0; x < narrow.size(); ++x, from += 2) {
-    narrow[x] = static_cast<uint8_t>((static_cast<uint32_t>(from[0] << 8 | from[1]) * 255 + 32895) >> 16);
+    narrow[x] =
+        static_cast<uint8_t>((static_cast<uint32_t>(from[0] << 8 | from[1]) * 255 + 32895) >> 16);
   }
 }
 
@@ -78,20 +79,23 @@ Status PsdPlanes::OpenPacked(std::span<const uint8_t> data, size_t height) {
   return Status::Ok;
 }
 
-Status PsdPlanes::Inflate(std::span<const uint8_t> data, const PsdHeader& header, size_t rowSize, size_t rows,
-                          bool differences) {
+Status PsdPlanes::Inflate(std::span<const uint8_t> data, const PsdHeader& header, size_t rowSize,
+                          size_t rows, bool differences) {
   const uint64_t size = uint64_t{rowSize} * rows;
   if (size / kBestRatio > data.size()) return Status::FileReadError;
-  if (size > limits.packedBlockBytes || !inflated_.Allocate(size)) return Status::MemoryAllocationError;
+  if (size > limits.packedBlockBytes || !inflated_.Allocate(size))
+    return Status::MemoryAllocationError;
   uLongf filled = size;
   const int result = uncompress(inflated_.Data(), &filled, data.data(), data.size());
   if (filled < size) return result == Z_BUF_ERROR ? Status::FileReadError : Status::DamagedFile;
   if (!differences) return Status::Ok;
-  for (size_t y = 0; y < rows; ++y) SumRow(inflated_.Bytes().subspan(y * rowSize, rowSize), header.depth == 16);
+  for (size_t y = 0; y < rows; ++y)
+    SumRow(inflated_.Bytes().subspan(y * rowSize, rowSize), header.depth == 16);
   return Status::Ok;
 }
 
-Status PsdPlanes::Open(std::span<const uint8_t> data, const PsdHeader& header, int32_t width, int32_t height, size_t channels) {
+Status PsdPlanes::Open(std::span<const uint8_t> data, const PsdHeader& header, int32_t width,
+                       int32_t height, size_t channels) {
   ByteReader bytes(data);
   const uint16_t compression = bytes.Be16();
   if (!bytes.Ok()) return Status::FileReadError;
@@ -108,7 +112,8 @@ Status PsdPlanes::Open(std::span<const uint8_t> data, const PsdHeader& header, i
     return Status::UnsupportedFormat;
   }
   if (data.size() / channels / rows < rowSize) return Status::FileReadError;
-  for (size_t c = 0; c < channels; ++c) planes_[c].data_ = data.subspan(c * rows * rowSize, rows * rowSize);
+  for (size_t c = 0; c < channels; ++c)
+    planes_[c].data_ = data.subspan(c * rows * rowSize, rows * rowSize);
   return Status::Ok;
 }
 

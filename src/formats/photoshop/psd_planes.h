@@ -10,10 +10,12 @@
 
 namespace fotomill {
 
-// The rows of one channel from the top down, as samples of 8 bits or, of a bitmap, as 8 pixels a byte.
+// The rows of one channel from the top down, as samples of 8 bits or, of a bitmap, as 8 pixels a
+// byte.
 class PsdPlane {
  public:
-  // The next row, `row` being as long as it is. DamagedFile when its code ends early, FileReadError when data are missing.
+  // The next row, `row` being as long as it is. DamagedFile when its code ends early, FileReadError
+  // when data are missing.
   Status Next(std::span<uint8_t> row);
 
  private:
@@ -28,15 +30,18 @@ class PsdPlane {
 // The channels of one compression: all of the merged picture, or one of a layer.
 class PsdPlanes {
  public:
-  // `data` begins with the compression. Every channel has `height` rows of `width` samples. FileReadError when the data
-  // cannot hold them, DamagedFile, MemoryAllocationError, UnsupportedFormat for an unknown compression.
-  Status Open(std::span<const uint8_t> data, const PsdHeader& header, int32_t width, int32_t height, size_t channels);
+  // `data` begins with the compression. Every channel has `height` rows of `width` samples.
+  // FileReadError when the data cannot hold them, DamagedFile, MemoryAllocationError,
+  // UnsupportedFormat for an unknown compression.
+  Status Open(std::span<const uint8_t> data, const PsdHeader& header, int32_t width, int32_t height,
+              size_t channels);
 
   PsdPlane& operator[](size_t channel) { return planes_[channel]; }
 
  private:
   Status OpenPacked(std::span<const uint8_t> data, size_t height);
-  Status Inflate(std::span<const uint8_t> data, const PsdHeader& header, size_t rowSize, size_t rows, bool differences);
+  Status Inflate(std::span<const uint8_t> data, const PsdHeader& header, size_t rowSize,
+                 size_t rows, bool differences);
 
   std::vector<PsdPlane> planes_;
   platform::MemoryBlock inflated_;

@@ -1,6 +1,6 @@
-// The writer of Photoshop documents: a merged picture without layers, its rows in PackBits. Black and white pictures are
-// bitmaps, those of the gray ramp gray, other palettes indexed, everything else RGB. EXIF, XMP, profile and resolution go
-// along as resources.
+// The writer of Photoshop documents: a merged picture without layers, its rows in PackBits. Black
+// and white pictures are bitmaps, those of the gray ramp gray, other palettes indexed, everything
+// else RGB. EXIF, XMP, profile and resolution go along as resources.
 #include <algorithm>
 #include <cmath>
 #include <vector>
@@ -18,7 +18,8 @@ namespace {
 constexpr uint16_t kPackBits = 1;
 
 bool IsColor(const Palette& palette, size_t index, uint8_t value) {
-  return std::all_of(&palette[3 * index], &palette[3 * index] + 3, [value](uint8_t part) { return part == value; });
+  return std::all_of(&palette[3 * index], &palette[3 * index] + 3,
+                     [value](uint8_t part) { return part == value; });
 }
 
 PsdMode ModeFor(const PictureRecord& picture) {
@@ -26,7 +27,8 @@ PsdMode ModeFor(const PictureRecord& picture) {
   const Palette& palette = picture.palette;
   if (bits == 24) return PsdMode::Rgb;
   if (bits == 8 && palette == GrayRamp()) return PsdMode::Gray;
-  const bool blackAndWhite = (IsColor(palette, 0, 0) && IsColor(palette, 1, 255)) || (IsColor(palette, 0, 255) && IsColor(palette, 1, 0));
+  const bool blackAndWhite = (IsColor(palette, 0, 0) && IsColor(palette, 1, 255)) ||
+                             (IsColor(palette, 0, 255) && IsColor(palette, 1, 0));
   return bits == 1 && blackAndWhite ? PsdMode::Bitmap : PsdMode::Indexed;
 }
 
@@ -43,7 +45,9 @@ void WriteResource(ByteWriter& out, PsdResource number, std::span<const uint8_t>
 
 void WriteResolution(ByteWriter& out, const PictureMetadata& metadata) {
   if (metadata.dpiX <= 0 || metadata.dpiY <= 0) return;
-  const auto fixed = [](double dpi) { return static_cast<uint32_t>(std::lround(std::min(dpi, 30000.0) * 65536)); };
+  const auto fixed = [](double dpi) {
+    return static_cast<uint32_t>(std::lround(std::min(dpi, 30000.0) * 65536));
+  };
   out.Text("8BIM");
   out.Be16(static_cast<uint16_t>(PsdResource::Resolution));
   out.Be16(0);
@@ -90,8 +94,12 @@ void WriteHeader(ByteWriter& out, const PackedImage& image, PsdMode mode) {
 class ChannelRows {
  public:
   ChannelRows(const PictureRecord& picture, PsdMode mode)
-      : image_(picture.image), mode_(mode), width_(static_cast<size_t>(image_.Width())), room_(3 * width_) {
-    if (mode == PsdMode::Bitmap && IsColor(picture.palette, 0, 0)) invert_ = 0xff;  // a set bit is black
+      : image_(picture.image),
+        mode_(mode),
+        width_(static_cast<size_t>(image_.Width())),
+        room_(3 * width_) {
+    // a set bit is black
+    if (mode == PsdMode::Bitmap && IsColor(picture.palette, 0, 0)) invert_ = 0xff;
   }
 
   std::span<const uint8_t> Row(size_t channel, int32_t y) {
@@ -106,7 +114,8 @@ class ChannelRows {
       return std::span(room_).first(size);
     }
     if (image_.Bits() == 8) return row.first(width_);
-    for (size_t x = 0; x < width_; ++x) room_[x] = static_cast<uint8_t>(image_.PixelAt(static_cast<int32_t>(x), y));
+    for (size_t x = 0; x < width_; ++x)
+      room_[x] = static_cast<uint8_t>(image_.PixelAt(static_cast<int32_t>(x), y));
     return std::span(room_).first(width_);
   }
 
@@ -145,7 +154,8 @@ Status PsdWrite(PictureRecord& picture, const WriteOptions& options) {
   const ProgressScope progress(picture);
   const PackedImage& image = picture.image;
   if (image.Empty()) return Status::MemoryAllocationError;
-  if (image.Width() > kLongestPsdSide || image.Height() > kLongestPsdSide) return Status::UnsuitableImage;
+  if (image.Width() > kLongestPsdSide || image.Height() > kLongestPsdSide)
+    return Status::UnsuitableImage;
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
   const PsdMode mode = ModeFor(picture);

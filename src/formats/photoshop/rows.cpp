@@ -11,7 +11,8 @@ using namespace std::string_view_literals;
 constexpr Signature kSignatures[] = {{0, "8BPS\0\1"sv, "Photoshop"}};
 constexpr Signature kLesserSignatures[] = {{0, "8BPS\0\1"sv}};
 
-constexpr FormatEntry Row(std::string_view extension, std::string_view description, std::span<const Signature> signatures) {
+constexpr FormatEntry Row(std::string_view extension, std::string_view description,
+                          std::span<const Signature> signatures) {
   return {.details = PsdDetails,
           .info = PsdInfo,
           .read = PsdRead,

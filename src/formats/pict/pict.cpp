@@ -1,8 +1,9 @@
 // Macintosh pictures (PICT): the pixels in them. How a file is laid out is told in pict_file.cpp.
 //
-// A picture that holds one piece of pixels is shown as that piece, with its own palette or in 24 bits. Several are drawn
-// where they belong in the frame, stretched where the picture says so. Lines, shapes and text are passed over; the details
-// tell how many there were. Alpha in the fourth part of a pixel is not taken, as most programs leave anything there.
+// A picture that holds one piece of pixels is shown as that piece, with its own palette or in 24
+// bits. Several are drawn where they belong in the frame, stretched where the picture says so.
+// Lines, shapes and text are passed over; the details tell how many there were. Alpha in the fourth
+// part of a pixel is not taken, as most programs leave anything there.
 #include "formats/pict/pict.h"
 
 #include <algorithm>
@@ -24,8 +25,9 @@ constexpr uint64_t kMostOverdraw = 64;  // how often the pieces of one picture m
 Rectangle Shown(const PictPixels& pixels) {
   const Rectangle& all = pixels.bounds;
   const Rectangle& part = pixels.source;
-  const bool inside = part.x >= all.x && part.y >= all.y && part.x + part.width <= all.x + all.width &&
-                      part.y + part.height <= all.y + all.height && part.width > 0 && part.height > 0;
+  const bool inside =
+      part.x >= all.x && part.y >= all.y && part.x + part.width <= all.x + all.width &&
+      part.y + part.height <= all.y + all.height && part.width > 0 && part.height > 0;
   return inside ? part : all;
 }
 
@@ -58,7 +60,8 @@ Status ChooseView(const PictFile& pict, View& view) {
 
 const char* KindName(const PictPixels& pixels) {
   if (pixels.jpeg) return "Macintosh PICT, QuickTime JPEG";
-  if (pixels.Indexed()) return pixels.inverted ? "Macintosh PICT, bitmap" : "Macintosh PICT, indexed";
+  if (pixels.Indexed())
+    return pixels.inverted ? "Macintosh PICT, bitmap" : "Macintosh PICT, indexed";
   return "Macintosh PICT, direct pixels";
 }
 
@@ -76,11 +79,13 @@ void DescribePicture(const PictFile& pict, const View& view, PictureRecord& pict
   }
   picture.simplified = pict.drawings > 0;
   picture.warning.Clear();
-  if (pict.drawings > 0) picture.warning.AssignCut("Lines, shapes and text of the drawing are not shown.");
+  if (pict.drawings > 0)
+    picture.warning.AssignCut("Lines, shapes and text of the drawing are not shown.");
   if (pict.cutShort) picture.warning.AssignCut("The file ends early.");
 }
 
-void StoreIndices(std::span<const uint8_t> indices, int32_t bits, int32_t width, std::span<uint8_t> row) {
+void StoreIndices(std::span<const uint8_t> indices, int32_t bits, int32_t width,
+                  std::span<uint8_t> row) {
   if (bits == 2) {  // the picture holds 4 bits
     for (size_t x = 0; x < static_cast<size_t>(width); ++x) {
       const auto value = static_cast<uint8_t>(indices[x / 4] >> (6 - 2 * (x % 4)) & 3);
@@ -92,7 +97,8 @@ void StoreIndices(std::span<const uint8_t> indices, int32_t bits, int32_t width,
   std::copy_n(indices.begin(), (pixelBits + 7) / 8, row.begin());
 }
 
-Status ReadPiece(const PictPixels& pixels, const View& view, const PictureRecord& picture, PackedImage& image) {
+Status ReadPiece(const PictPixels& pixels, const View& view, const PictureRecord& picture,
+                 PackedImage& image) {
   const Rectangle shown = Shown(pixels);
   PictRowDecoder rows(pixels);
   for (int32_t y = 0; y < shown.y - pixels.bounds.y; ++y) RETURN_IF_BAD(rows.Next());
@@ -102,7 +108,8 @@ Status ReadPiece(const PictPixels& pixels, const View& view, const PictureRecord
       StoreIndices(rows.Indices(), view.bits, view.width, image.Row(y));
     } else {
       const auto first = 3 * static_cast<size_t>(shown.x - pixels.bounds.x);
-      std::ranges::copy(rows.Colors().subspan(first, 3 * static_cast<size_t>(shown.width)), image.Row(y).begin());
+      std::ranges::copy(rows.Colors().subspan(first, 3 * static_cast<size_t>(shown.width)),
+                        image.Row(y).begin());
     }
     RETURN_IF_BAD(picture.ReportRow(y));
   }
@@ -110,20 +117,25 @@ Status ReadPiece(const PictPixels& pixels, const View& view, const PictureRecord
 }
 
 // Draws row `y` of `height`, pixels of three bytes, into its place on the canvas.
-void DrawRow(std::span<const uint8_t> bgr, int32_t y, int32_t height, const Rectangle& target, PackedImage& canvas) {
+void DrawRow(std::span<const uint8_t> bgr, int32_t y, int32_t height, const Rectangle& target,
+             PackedImage& canvas) {
   const auto width = static_cast<int64_t>(bgr.size() / 3);
   const int64_t firstRow = target.y + int64_t{target.height} * y / height;
   const int64_t endRow = target.y + int64_t{target.height} * (y + 1) / height;
-  const int64_t firstColumn = std::max(target.x, 0), endColumn = std::min(target.x + target.width, canvas.Width());
-  for (int64_t row = std::max<int64_t>(firstRow, 0); row < std::min<int64_t>(endRow, canvas.Height()); ++row) {
+  const int64_t firstColumn = std::max(target.x, 0),
+                endColumn = std::min(target.x + target.width, canvas.Width());
+  for (int64_t row = std::max<int64_t>(firstRow, 0);
+       row < std::min<int64_t>(endRow, canvas.Height()); ++row) {
     uint8_t* const place = canvas.Row(static_cast<int32_t>(row)).data();
     for (int64_t x = firstColumn; x < endColumn; ++x) {
-      std::memcpy(place + 3 * x, &bgr[static_cast<size_t>(3 * ((x - target.x) * width / target.width))], 3);
+      std::memcpy(place + 3 * x,
+                  &bgr[static_cast<size_t>(3 * ((x - target.x) * width / target.width))], 3);
     }
   }
 }
 
-// Hands the rows of a JPEG file to `draw`: blue, green, red, the row's number, and how many there are.
+// Hands the rows of a JPEG file to `draw`: blue, green, red, the row's number, and how many there
+// are.
 template <typename Draw>
 Status ReadJpeg(std::span<const uint8_t> file, Draw draw) {
   JpegReader reader;
@@ -131,7 +143,8 @@ Status ReadJpeg(std::span<const uint8_t> file, Draw draw) {
   jpeg_decompress_struct& info = reader.info;
   if (info.num_components != 1 && info.num_components != 3) return Status::UnsupportedFormat;
   if (info.image_width > INT16_MAX || info.image_height > INT16_MAX) return Status::DamagedFile;
-  const uint64_t pixels = PackedRowBytes(static_cast<int32_t>(info.image_width), static_cast<int32_t>(info.image_height), 24);
+  const uint64_t pixels = PackedRowBytes(static_cast<int32_t>(info.image_width),
+                                         static_cast<int32_t>(info.image_height), 24);
   RETURN_IF_BAD(CheckFileMemory(JpegCoefficientBytes(reader, false) + pixels));
   std::vector<uint8_t> row(size_t{3} * info.image_width);
   const bool read = Guarded(reader.errors, [&] {
@@ -151,7 +164,8 @@ Status ReadJpeg(std::span<const uint8_t> file, Draw draw) {
 // How many pixels of a canvas a rectangle covers.
 uint64_t PixelsOn(const PackedImage& canvas, const Rectangle& target) {
   const int32_t width = std::min(target.x + target.width, canvas.Width()) - std::max(target.x, 0);
-  const int32_t height = std::min(target.y + target.height, canvas.Height()) - std::max(target.y, 0);
+  const int32_t height =
+      std::min(target.y + target.height, canvas.Height()) - std::max(target.y, 0);
   return width < 1 || height < 1 ? 0 : static_cast<uint64_t>(width) * static_cast<uint64_t>(height);
 }
 
@@ -166,8 +180,11 @@ Status ReadCanvas(const PictFile& pict, const PictureRecord& picture, PackedImag
     RETURN_IF_BAD(picture.ReportRow(done++, static_cast<int32_t>(pict.pixels.size())));
     if (target.width < 1 || target.height < 1) continue;
     drawn += PixelsOn(image, target);
-    if (drawn > kMostOverdraw * PixelsOn(image, {0, 0, image.Width(), image.Height()})) return Status::UnsupportedFormat;
-    const auto draw = [&](std::span<const uint8_t> bgr, int32_t y, int32_t height) { DrawRow(bgr, y, height, target, image); };
+    if (drawn > kMostOverdraw * PixelsOn(image, {0, 0, image.Width(), image.Height()}))
+      return Status::UnsupportedFormat;
+    const auto draw = [&](std::span<const uint8_t> bgr, int32_t y, int32_t height) {
+      DrawRow(bgr, y, height, target, image);
+    };
     if (pixels.jpeg) {
       RETURN_IF_BAD(ReadJpeg(pixels.data, draw));
       continue;
@@ -184,7 +201,8 @@ Status ReadCanvas(const PictFile& pict, const PictureRecord& picture, PackedImag
   return Status::Ok;
 }
 
-Status OpenPicture(platform::FileView& file, const std::string& name, PictFile& pict, View& view, PictureRecord& picture) {
+Status OpenPicture(platform::FileView& file, const std::string& name, PictFile& pict, View& view,
+                   PictureRecord& picture) {
   if (!file.Open(name)) return Status::FileOpenError;
   picture.fileSize = file.FileSize();
   RETURN_IF_BAD(ParsePict(file.Bytes(), pict));
@@ -240,7 +258,8 @@ Status PictDetails(PictureRecord& picture) {
   lines.AddFormat("        Frame: %d x %d", pict.frame.width, pict.frame.height);
   lines.AddFormat("       Pieces: %zu of pixels", pict.pixels.size());
   const PictPixels& first = pict.pixels.front();
-  if (!first.jpeg) lines.AddFormat("       Pixels: %d bits%s", first.bits, first.packed ? ", packed" : "");
+  if (!first.jpeg)
+    lines.AddFormat("       Pixels: %d bits%s", first.bits, first.packed ? ", packed" : "");
   if (pict.drawings > 0) lines.AddFormat("    Not drawn: %d lines, shapes, texts", pict.drawings);
   if (pict.unsupported > 0) lines.AddFormat("  Not decoded: %d pieces of pixels", pict.unsupported);
   return Status::Ok;

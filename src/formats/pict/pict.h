@@ -6,12 +6,13 @@
 
 namespace fotomill {
 
-// Macintosh pictures (PICT). Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when data are cut short,
-// MemoryAllocationError (6), UnsupportedFormat (8) for kinds of pixels that are not decoded, NoImages (20) for a drawing
-// without any pixels.
+// Macintosh pictures (PICT). Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when
+// data are cut short, MemoryAllocationError (6), UnsupportedFormat (8) for kinds of pixels that are
+// not decoded, NoImages (20) for a drawing without any pixels.
 Status PictInfo(PictureRecord& picture, const ReadRequest& request);
 Status PictRead(PictureRecord& picture, const ReadRequest& request);
-// Also UnsuitableImage (13) for more than 8191 columns or 32767 rows, ErrorCreatingFile (10), ErrorWritingFile (11).
+// Also UnsuitableImage (13) for more than 8191 columns or 32767 rows, ErrorCreatingFile (10),
+// ErrorWritingFile (11).
 Status PictWrite(PictureRecord& picture, const WriteOptions& options);
 Status PictDetails(PictureRecord& picture);
 

@@ -4,26 +4,33 @@
 //        0  512  nothing, or this part is missing
 //        0    2  bytes of the picture, low half
 //        2    8  frame: top, left, bottom, right
-//       10       version 1: 11 01, operations of one byte; version 2: 00 11 02 FF, operations of 2 bytes at even offsets
+//       10       version 1: 11 01, operations of one byte; version 2: 00 11 02 FF, operations of 2
+//       bytes at even offsets
 //
-// Operations that hold pixels: 90, 91 (those of a region) bits as they are; 98, 99 packed; 9A, 9B without color table:
+// Operations that hold pixels: 90, 91 (those of a region) bits as they are; 98, 99 packed; 9A, 9B
+// without color table:
 //       9A, 9B: 4  base address, FF
 //        2  bytes of a row; 0x8000: a pixel map
 //        8  bounds
-//       36  of a pixel map: version (2), pack type (2), pack size (4), resolutions (8), pixel type (2), bits of a pixel (2),
+//       36  of a pixel map: version (2), pack type (2), pack size (4), resolutions (8), pixel type
+//       (2), bits of a pixel (2),
 //           parts (2), bits of a part (2), nothing (12)
-//        .  of a pixel map with colors: seed (4), flags (2), entries less one (2), entries of index, red, green, blue (2 each)
+//        .  of a pixel map with colors: seed (4), flags (2), entries less one (2), entries of
+//        index, red, green, blue (2 each)
 //       18  source and target rectangle, mode
 //        .  91, 99, 9B: region: bytes (2, themselves included), data
-//        .  rows; a packed one behind the number of its bytes, in 1 byte where an unpacked row has at most 250, else in 2
+//        .  rows; a packed one behind the number of its bytes, in 1 byte where an unpacked row has
+//        at most 250, else in 2
 //
-// 8200 holds a compressed picture of QuickTime: bytes (4), version (2), matrix (36), matte size (4), matte (8), mode (2),
-// source (8), accuracy (4), mask size (4), where there is a matte its description and data, the mask, then the description of
-// the picture: its bytes (4), type (4), ..., width at 32, height at 34, bytes of data at 44, and the data.
+// 8200 holds a compressed picture of QuickTime: bytes (4), version (2), matrix (36), matte size
+// (4), matte (8), mode (2), source (8), accuracy (4), mask size (4), where there is a matte its
+// description and data, the mask, then the description of the picture: its bytes (4), type (4),
+// ..., width at 32, height at 34, bytes of data at 44, and the data.
 //
-// Some programs chose the size of the counts by the bytes that are packed, without the fourth part; where the file makes no
-// sense otherwise, it is read that way. All other operations are skipped by their sizes, as the source tells them.
-// Source: Apple Computer, "Inside Macintosh: Imaging With QuickDraw", appendix A (1994), and "QuickTime File Format".
+// Some programs chose the size of the counts by the bytes that are packed, without the fourth part;
+// where the file makes no sense otherwise, it is read that way. All other operations are skipped by
+// their sizes, as the source tells them. Source: Apple Computer, "Inside Macintosh: Imaging With
+// QuickDraw", appendix A (1994), and "QuickTime File Format".
 #include "formats/pict/pict_file.h"
 
 #include <algorithm>
@@ -42,7 +49,15 @@ constexpr size_t kShortRow = 8, kLongRow = 250;
 constexpr size_t kMostPixels = 65536;  // pieces of one picture
 
 // How long the data of an operation is: a number of bytes, or one of these.
-enum Size : int8_t { Word = -1, Long = -2, Region = -3, Text = -4, Comment = -5, Pattern = -6, Pixels = -7 };
+enum Size : int8_t {
+  Word = -1,
+  Long = -2,
+  Region = -3,
+  Text = -4,
+  Comment = -5,
+  Pattern = -6,
+  Pixels = -7
+};
 
 struct Operations {
   uint32_t first, last;
@@ -108,7 +123,8 @@ void TakeColorTable(ByteReader& bytes, PictPixels& pixels) {
   pixels.colorTable = bytes.Take((bytes.Be16() + uint64_t{1}) * 8);
 }
 
-// The bytes of packed rows and their counts; more than there are when they do not end within the data.
+// The bytes of packed rows and their counts; more than there are when they do not end within the
+// data.
 uint64_t PackedSize(ByteReader rows, size_t height, bool longCounts) {
   const uint64_t begin = rows.Position(), left = rows.Left();
   for (size_t y = 0; y < height && rows.Ok(); ++y) rows.Skip(longCounts ? rows.Be16() : rows.U8());
@@ -119,13 +135,15 @@ uint64_t PackedSize(ByteReader rows, size_t height, bool longCounts) {
 void TakeRows(ByteReader& bytes, PictPixels& pixels) {
   const auto height = static_cast<size_t>(std::max(pixels.bounds.height, 0));
   if (!pixels.packed) {
-    const size_t size = pixels.bits == 32 && pixels.packType == 2 ? pixels.rowBytes / 4 * 3 : pixels.rowBytes;
+    const size_t size =
+        pixels.bits == 32 && pixels.packType == 2 ? pixels.rowBytes / 4 * 3 : pixels.rowBytes;
     pixels.data = bytes.Take(uint64_t{size} * height);
     return;
   }
   pixels.longCounts = pixels.rowBytes > kLongRow;
   uint64_t size = PackedSize(bytes, height, pixels.longCounts);
-  if (size > bytes.Left() && pixels.bits == 32 && 3 * static_cast<size_t>(pixels.bounds.width) <= kLongRow) {
+  if (size > bytes.Left() && pixels.bits == 32 &&
+      3 * static_cast<size_t>(pixels.bounds.width) <= kLongRow) {
     pixels.longCounts = false;
     size = PackedSize(bytes, height, false);
   }
@@ -139,8 +157,10 @@ bool IsDecoded(const PictPixels& pixels) {
     const bool known = pixels.bits == 1 || pixels.bits == 2 || pixels.bits == 4 || pixels.bits == 8;
     return known && pixels.rowBytes * 8 >= width * static_cast<size_t>(pixels.bits);
   }
-  if (pixels.packType < 1 || pixels.packType > 4 || pixels.parts < 3 || pixels.parts > 4) return false;
-  if (pixels.bits == 16) return (pixels.packType == 1 || pixels.packType == 3) && pixels.rowBytes >= 2 * width;
+  if (pixels.packType < 1 || pixels.packType > 4 || pixels.parts < 3 || pixels.parts > 4)
+    return false;
+  if (pixels.bits == 16)
+    return (pixels.packType == 1 || pixels.packType == 3) && pixels.rowBytes >= 2 * width;
   return pixels.bits == 32 && pixels.packType != 3 && pixels.rowBytes >= 4 * width;
 }
 
@@ -191,7 +211,8 @@ void SkipPattern(ByteReader& bytes) {
 void TakeQuickTime(std::span<const uint8_t> data, PictFile& pict) {
   ByteReader bytes(data);
   bytes.Skip(2 + 24);
-  const auto x = static_cast<int16_t>(bytes.Be32() >> 16), y = static_cast<int16_t>(bytes.Be32() >> 16);
+  const auto x = static_cast<int16_t>(bytes.Be32() >> 16),
+             y = static_cast<int16_t>(bytes.Be32() >> 16);
   bytes.Skip(4);
   const uint32_t matteSize = bytes.Be32();
   bytes.Skip(8 + 2 + 8 + 4);

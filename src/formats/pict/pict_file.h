@@ -9,7 +9,8 @@
 
 namespace fotomill {
 
-// What of a Macintosh picture can be shown, as views into the file. The layout is told in pict_file.cpp.
+// What of a Macintosh picture can be shown, as views into the file. The layout is told in
+// pict_file.cpp.
 
 struct PictPixels {
   size_t rowBytes = 0;   // of an unpacked row
@@ -17,7 +18,8 @@ struct PictPixels {
   Rectangle source;      // the part of them that is drawn
   Rectangle target;      // where, in the picture's coordinates
   int32_t bits = 1;      // of a pixel: 1, 2, 4, 8 with colors, 16 and 32 without
-  int32_t packType = 0;  // of 16 and 32 bits: 1 none, 2 without the fourth byte, 3 by pixels, 4 by colors
+  // of 16 and 32 bits: 1 none, 2 without the fourth byte, 3 by pixels, 4 by colors
+  int32_t packType = 0;
   int32_t parts = 3;     // colors, and perhaps a fourth part, of a pixel of 32 bits
   bool packed = false;   // each row after the number of its bytes
   bool longCounts = false;  // which takes 2 bytes
@@ -25,7 +27,8 @@ struct PictPixels {
   std::span<const uint8_t> colorTable;  // index, red, green, blue, 2 bytes each
   bool tableInOrder = false;            // the indices do not count
   std::span<const uint8_t> data;        // of all rows
-  bool jpeg = false;                    // `data` is a JPEG file, and of the facts above only `target` counts
+  // `data` is a JPEG file, and of the facts above only `target` counts
+  bool jpeg = false;
 
   bool Indexed() const { return !jpeg && bits <= 8; }
 };

@@ -23,13 +23,16 @@ bool UnpackPixels(std::span<const uint8_t> code, std::span<uint8_t> row) {
     const size_t room = std::min(count, (row.size() - at) / 2);
     const auto pixels = bytes.Take(repeats ? 2 : 2 * count);
     if (!bytes.Ok()) return false;
-    for (size_t i = 0; i < room; ++i) std::copy_n(&pixels[repeats ? 0 : 2 * i], 2, &row[at + 2 * i]);
+    for (size_t i = 0; i < room; ++i)
+      std::copy_n(&pixels[repeats ? 0 : 2 * i], 2, &row[at + 2 * i]);
     at += 2 * room;
   }
   return true;
 }
 
-uint8_t FiveToEight(uint32_t value) { return static_cast<uint8_t>((value & 31) << 3 | (value & 31) >> 2); }
+uint8_t FiveToEight(uint32_t value) {
+  return static_cast<uint8_t>((value & 31) << 3 | (value & 31) >> 2);
+}
 
 }  // namespace
 
@@ -37,7 +40,9 @@ PictRowDecoder::PictRowDecoder(const PictPixels& pixels) : pixels_(pixels), data
   const auto width = static_cast<size_t>(pixels.bounds.width);
   const bool byColors = pixels.bits == 32 && pixels.packType == 4;
   const bool threeBytes = pixels.bits == 32 && pixels.packType == 2;
-  raw_.resize(byColors ? width * static_cast<size_t>(pixels.parts) : threeBytes ? pixels.rowBytes / 4 * 3 : pixels.rowBytes);
+  raw_.resize(byColors     ? width * static_cast<size_t>(pixels.parts)
+              : threeBytes ? pixels.rowBytes / 4 * 3
+                           : pixels.rowBytes);
   bgr_.resize(3 * width);
   if (pixels.Indexed()) SetPalette();
 }
@@ -80,7 +85,8 @@ std::span<const uint8_t> PictRowDecoder::Colors() {
   if (pixels_.Indexed()) {
     const auto bits = static_cast<size_t>(pixels_.bits), perByte = 8 / bits;
     for (size_t x = 0; x < width; ++x) {
-      const size_t index = raw_[x / perByte] >> (8 - bits * (x % perByte + 1)) & ((size_t{1} << bits) - 1);
+      const size_t index =
+          raw_[x / perByte] >> (8 - bits * (x % perByte + 1)) & ((size_t{1} << bits) - 1);
       for (size_t c = 0; c < 3; ++c) bgr_[3 * x + c] = palette_[3 * index + 2 - c];
     }
   } else if (pixels_.bits == 16) {

@@ -1,4 +1,5 @@
-// The writer of Macintosh pictures: version 2 with the preamble, one piece of direct pixels, packed by colors.
+// The writer of Macintosh pictures: version 2 with the preamble, one piece of direct pixels, packed
+// by colors.
 #include <vector>
 
 #include "core/byte_writer.h"
@@ -10,9 +11,11 @@ namespace fotomill {
 
 namespace {
 
-constexpr int32_t kMostColumns = 8191, kMostRows = 32767;  // a row of 32-bit pixels has at most 32767 bytes
+// a row of 32-bit pixels has at most 32767 bytes
+constexpr int32_t kMostColumns = 8191, kMostRows = 32767;
 constexpr uint32_t kScreenResolution = 72 << 16;
-constexpr uint16_t kDirectPixels[] = {16, 32, 3, 8};  // their type, bits of a pixel, parts, bits of a part
+// their type, bits of a pixel, parts, bits of a part
+constexpr uint16_t kDirectPixels[] = {16, 32, 3, 8};
 constexpr size_t kLongRow = 250;
 constexpr uint64_t kPreamble = 512;
 

@@ -1,17 +1,20 @@
 // Portable Network Graphics (PNG), big-endian; png_write.cpp writes.
 //
 //   signature 89 50 4E 47 0D 0A 1A 0A, then chunks of length, type, data and CRC:
-//   IHDR  width, height (4 bytes each), bit depth, color type (1 color, 2 palette bit, 4 alpha), 0, 0, interlace
-//   PLTE, tRNS, pHYs, gAMA, iCCP, eXIf, tEXt, zTXt, iTXt, acTL ..., IDAT (deflated rows), IEND
+//   IHDR  width, height (4 bytes each), bit depth, color type (1 color, 2 palette bit, 4 alpha), 0,
+//   0, interlace PLTE, tRNS, pHYs, gAMA, iCCP, eXIf, tEXt, zTXt, iTXt, acTL ..., IDAT (deflated
+//   rows), IEND
 //
-// What the reader makes of it: palettes and grays of 1, 2, 4 and 8 bits without transparency keep their depth (grays with
-// a gray palette); everything else becomes 24 bits, with an alpha plane where there is an alpha channel or a transparent
-// color. 16-bit samples are rounded to 8. Gamma is told, not applied. Of an animation (acTL) the default picture is shown.
-// EXIF, XMP, ICC profile and resolution travel with the picture.
+// What the reader makes of it: palettes and grays of 1, 2, 4 and 8 bits without transparency keep
+// their depth (grays with a gray palette); everything else becomes 24 bits, with an alpha plane
+// where there is an alpha channel or a transparent color. 16-bit samples are rounded to 8. Gamma is
+// told, not applied. Of an animation (acTL) the default picture is shown. EXIF, XMP, ICC profile
+// and resolution travel with the picture.
 //
-// libpng reads everything in front of the pixels. Pixels that are not interlaced are inflated by libdeflate as a whole and
-// unfiltered here, which takes half the time; interlaced ones, rare forms and whatever looks damaged are libpng's.
-// Source: W3C, "Portable Network Graphics (PNG) Specification (Third Edition)", 2025; libpng manual.
+// libpng reads everything in front of the pixels. Pixels that are not interlaced are inflated by
+// libdeflate as a whole and unfiltered here, which takes half the time; interlaced ones, rare forms
+// and whatever looks damaged are libpng's. Source: W3C, "Portable Network Graphics (PNG)
+// Specification (Third Edition)", 2025; libpng manual.
 #include "formats/png/png.h"
 
 #include <algorithm>
@@ -78,7 +81,8 @@ struct PngLayout {
   RowForm rows = RowForm::Direct;
 };
 
-// Whether the chunks in front of the pixels lie in the file: for one that only claims a size the library would make room.
+// Whether the chunks in front of the pixels lie in the file: for one that only claims a size the
+// library would make room.
 Status CheckHead(std::span<const uint8_t> file) {
   PngWalk walk(file);
   for (PngPlace chunk; walk.Next(chunk);) {
@@ -105,14 +109,17 @@ Status ReadHeader(PngReader& reader) {
 PngLayout ChooseLayout(const PngReader& reader) {
   const png_byte type = png_get_color_type(reader.png, reader.info);
   const png_byte depth = png_get_bit_depth(reader.png, reader.info);
-  const bool transparent = (type & PNG_COLOR_MASK_ALPHA) != 0 || png_get_valid(reader.png, reader.info, PNG_INFO_tRNS) != 0;
+  const bool transparent = (type & PNG_COLOR_MASK_ALPHA) != 0 ||
+                           png_get_valid(reader.png, reader.info, PNG_INFO_tRNS) != 0;
   const bool indexed = type == PNG_COLOR_TYPE_PALETTE || type == PNG_COLOR_TYPE_GRAY;
   PngLayout layout;
   layout.width = static_cast<int32_t>(png_get_image_width(reader.png, reader.info));
   layout.height = static_cast<int32_t>(png_get_image_height(reader.png, reader.info));
   layout.interlaced = png_get_interlace_type(reader.png, reader.info) != PNG_INTERLACE_NONE;
   layout.bitsPerPixel = indexed && !transparent ? std::min<int32_t>(depth, 8) : 24;
-  layout.rows = transparent ? RowForm::WithAlpha : layout.bitsPerPixel == 2 ? RowForm::TwoBits : RowForm::Direct;
+  layout.rows = transparent                ? RowForm::WithAlpha
+                : layout.bitsPerPixel == 2 ? RowForm::TwoBits
+                                           : RowForm::Direct;
   return layout;
 }
 
@@ -173,7 +180,8 @@ void TakeMetadata(const PngReader& reader, PictureRecord& picture) {
   picture.metadata = {};
   png_bytep exif = nullptr;
   png_uint_32 exifSize = 0;
-  if (png_get_eXIf_1(reader.png, reader.info, &exifSize, &exif) != 0) Assign(picture.metadata.exif, exif, exifSize);
+  if (png_get_eXIf_1(reader.png, reader.info, &exifSize, &exif) != 0)
+    Assign(picture.metadata.exif, exif, exifSize);
   png_charp name = nullptr;
   int method = 0;
   png_bytep profile = nullptr;
@@ -190,23 +198,24 @@ void TakeMetadata(const PngReader& reader, PictureRecord& picture) {
   }
 }
 
-// The number of frames that an animation's acTL chunk names, as far as the file has them, 1 for a still picture. The chunk
-// stands before the pixels, and each frame has an fcTL chunk.
+// The number of frames that an animation's acTL chunk names, as far as the file has them, 1 for a
+// still picture. The chunk stands before the pixels, and each frame has an fcTL chunk.
 int32_t FrameCount(std::span<const uint8_t> file) {
   PngChunks chunks(file);
   PngChunk chunk;
   uint32_t named = 0, there = 0;
   while ((named == 0 || there < named) && chunks.Next(chunk)) {
     if (chunk.type == "IDAT" && named == 0) break;
-    if (chunk.type == "acTL") named = std::min(ByteReader(chunk.data).Be32(), limits.animationFrames);
+    if (chunk.type == "acTL")
+      named = std::min(ByteReader(chunk.data).Be32(), limits.animationFrames);
     if (chunk.type == "fcTL") ++there;
   }
   return static_cast<int32_t>(std::max(std::min(named, there), 1u));
 }
 
 // Fills the facts.
-Status Describe(PngReader& reader, std::span<const uint8_t> file, PngLayout& layout, const ReadOptions& options,
-                PictureRecord& picture) {
+Status Describe(PngReader& reader, std::span<const uint8_t> file, PngLayout& layout,
+                const ReadOptions& options, PictureRecord& picture) {
   RETURN_IF_BAD(ReadHeader(reader));
   layout = ChooseLayout(reader);
   const int32_t frames = FrameCount(file);
@@ -217,7 +226,8 @@ Status Describe(PngReader& reader, std::span<const uint8_t> file, PngLayout& lay
   picture.height = layout.height;
   picture.bitsPerPixel = layout.bitsPerPixel;
   const bool alpha = layout.rows == RowForm::WithAlpha;
-  picture.alphaFlags = static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (alpha ? kHasAlpha : 0));
+  picture.alphaFlags =
+      static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (alpha ? kHasAlpha : 0));
   picture.imageBytes = EstimateImageBytes(layout.width, layout.height, layout.bitsPerPixel);
   TakePalette(reader, layout, picture.palette);
   TakeMetadata(reader, picture);
@@ -236,14 +246,16 @@ struct PngTarget {
 
 void StoreRow(const PngLayout& layout, const uint8_t* source, int32_t y, PngTarget& target) {
   if (layout.rows == RowForm::WithAlpha) {
-    SplitAlpha(source, static_cast<size_t>(layout.width), target.image.Row(y).data(), target.alpha.Row(y).data());
+    SplitAlpha(source, static_cast<size_t>(layout.width), target.image.Row(y).data(),
+               target.alpha.Row(y).data());
   } else {
     PackNibbles(source, target.image.Row(y).data(), layout.width);
   }
 }
 
 // Rows that come in order: straight into the picture, or through one row.
-Status ReadInOrder(PngReader& reader, const PngLayout& layout, const PictureRecord& picture, PngTarget& target) {
+Status ReadInOrder(PngReader& reader, const PngLayout& layout, const PictureRecord& picture,
+                   PngTarget& target) {
   std::vector<uint8_t> row(png_get_rowbytes(reader.png, reader.info));
   Status status = Status::Ok;
   const bool read = PngGuarded(reader.png, [&] {
@@ -258,14 +270,17 @@ Status ReadInOrder(PngReader& reader, const PngLayout& layout, const PictureReco
 }
 
 // Interlaced rows come in seven passes, each of which fills in pixels, so all of them must be held.
-Status ReadInterlaced(PngReader& reader, const PngLayout& layout, const PictureRecord& picture, PngTarget& target) {
+Status ReadInterlaced(PngReader& reader, const PngLayout& layout, const PictureRecord& picture,
+                      PngTarget& target) {
   const uint64_t rowBytes = png_get_rowbytes(reader.png, reader.info);
   platform::MemoryBlock buffer;
-  if (layout.rows != RowForm::Direct && !buffer.Allocate(rowBytes * static_cast<uint64_t>(layout.height))) {
+  if (layout.rows != RowForm::Direct &&
+      !buffer.Allocate(rowBytes * static_cast<uint64_t>(layout.height))) {
     return Status::MemoryAllocationError;
   }
   const auto rowAt = [&](int32_t y) {
-    return buffer.Empty() ? target.image.Row(y).data() : buffer.Data() + rowBytes * static_cast<uint64_t>(y);
+    return buffer.Empty() ? target.image.Row(y).data()
+                          : buffer.Data() + rowBytes * static_cast<uint64_t>(y);
   };
   Status status = Status::Ok;
   const bool read = PngGuarded(reader.png, [&] {
@@ -287,17 +302,22 @@ Status ReadInterlaced(PngReader& reader, const PngLayout& layout, const PictureR
 }
 
 // How a whole row of the file, free of its filter, becomes the picture's.
-using StoreFileRow = void (*)(const uint8_t* source, size_t width, const PngReader& reader, uint8_t* image, uint8_t* alpha);
+using StoreFileRow = void (*)(const uint8_t* source, size_t width, const PngReader& reader,
+                              uint8_t* image, uint8_t* alpha);
 
-uint8_t HighByte(const uint8_t* sample) { return static_cast<uint8_t>(((sample[0] << 8 | sample[1]) * 255u + 32895) >> 16); }
+uint8_t HighByte(const uint8_t* sample) {
+  return static_cast<uint8_t>(((sample[0] << 8 | sample[1]) * 255u + 32895) >> 16);
+}
 
 template <int kBits>
 void CopyPixels(const uint8_t* source, size_t width, const PngReader&, uint8_t* image, uint8_t*) {
   std::memcpy(image, source, (width * kBits + 7) / 8);
 }
 
-template <size_t kSamples, size_t kBytes>  // gray or colors, with alpha when the number is even; samples of one or two bytes
-void StoreSamples(const uint8_t* source, size_t width, const PngReader&, uint8_t* image, uint8_t* alpha) {
+// gray or colors, with alpha when the number is even; samples of one or two bytes
+template <size_t kSamples, size_t kBytes>
+void StoreSamples(const uint8_t* source, size_t width, const PngReader&, uint8_t* image,
+                  uint8_t* alpha) {
   const auto sample = [](const uint8_t* at) { return kBytes == 1 ? *at : HighByte(at); };
   constexpr size_t kColors = kSamples < 3 ? 1 : 3;
   for (size_t x = 0; x < width; ++x, source += kSamples * kBytes, image += 3) {
@@ -312,12 +332,14 @@ void StoreColors(const uint8_t* source, size_t width, const PngReader&, uint8_t*
   SwapColors(source, width, image);
 }
 
-void StoreDeepGrays(const uint8_t* source, size_t width, const PngReader&, uint8_t* image, uint8_t*) {
+void StoreDeepGrays(const uint8_t* source, size_t width, const PngReader&, uint8_t* image,
+                    uint8_t*) {
   for (size_t x = 0; x < width; ++x) image[x] = HighByte(source + 2 * x);
 }
 
 // Colors of a palette with alpha.
-void StorePaletteAlpha(const uint8_t* source, size_t width, const PngReader& reader, uint8_t* image, uint8_t* alpha) {
+void StorePaletteAlpha(const uint8_t* source, size_t width, const PngReader& reader, uint8_t* image,
+                       uint8_t* alpha) {
   png_bytep opacities = nullptr;
   png_colorp colors = nullptr;
   int opacityCount = 0, count = 0;
@@ -359,18 +381,21 @@ StoreFileRow FileRowStore(const PngReader& reader, const PngLayout& layout) {
   const bool transparentColor = png_get_valid(reader.png, reader.info, PNG_INFO_tRNS) != 0;
   for (const Form& form : kForms) {
     const bool matches = form.type == png_get_color_type(reader.png, reader.info) &&
-                         form.depth == png_get_bit_depth(reader.png, reader.info) && form.transparentColor == transparentColor;
+                         form.depth == png_get_bit_depth(reader.png, reader.info) &&
+                         form.transparentColor == transparentColor;
     if (matches && !layout.interlaced) return form.store;
   }
   return nullptr;
 }
 
-// All rows, inflated at once, in `room` bytes of memory. False, with the target in any state, when the library has to try.
-bool ReadAtOnce(const PngReader& reader, const PngLayout& layout, const PictureRecord& picture, uint64_t room,
-                PngTarget& target) {
+// All rows, inflated at once, in `room` bytes of memory. False, with the target in any state, when
+// the library has to try.
+bool ReadAtOnce(const PngReader& reader, const PngLayout& layout, const PictureRecord& picture,
+                uint64_t room, PngTarget& target) {
   const StoreFileRow store = FileRowStore(reader, layout);
   if (store == nullptr) return false;
-  const uint32_t pixelBits = uint32_t{png_get_bit_depth(reader.png, reader.info)} * png_get_channels(reader.png, reader.info);
+  const uint32_t pixelBits = uint32_t{png_get_bit_depth(reader.png, reader.info)} *
+                             png_get_channels(reader.png, reader.info);
   const uint64_t rowBytes = (static_cast<uint64_t>(layout.width) * pixelBits + 7) / 8;
   PngPixels pixels;
   if (!pixels.Inflate(reader.file, rowBytes, pixelBits, layout.height, room)) return false;
@@ -387,8 +412,10 @@ bool ReadAtOnce(const PngReader& reader, const PngLayout& layout, const PictureR
 Status ReadPixels(PngReader& reader, const PngLayout& layout, PictureRecord& picture) {
   PngTarget target;
   const bool withAlpha = layout.rows == RowForm::WithAlpha;
-  const uint64_t pixels = static_cast<uint64_t>(layout.width) * static_cast<uint64_t>(layout.height);
-  const uint64_t held = PackedRowBytes(layout.width, layout.height, layout.bitsPerPixel) + (withAlpha ? pixels : 0);
+  const uint64_t pixels =
+      static_cast<uint64_t>(layout.width) * static_cast<uint64_t>(layout.height);
+  const uint64_t held =
+      PackedRowBytes(layout.width, layout.height, layout.bitsPerPixel) + (withAlpha ? pixels : 0);
   RETURN_IF_BAD(CheckFileMemory(held + (!layout.interlaced ? 0 : withAlpha ? 4 * pixels : layout.rows == RowForm::TwoBits ? pixels : 0)));
   RETURN_IF_BAD(NewPackedImage(layout.width, layout.height, &picture.palette, layout.bitsPerPixel, target.image));
   if (withAlpha) RETURN_IF_BAD(NewAlphaPlane(layout.width, layout.height, target.alpha));
@@ -419,14 +446,16 @@ void AddHeaderLines(const PngReader& reader, DetailLines& lines) {
   const bool interlaced = png_get_interlace_type(reader.png, reader.info) != PNG_INTERLACE_NONE;
   lines.AddFormat("   Interlaced: %s", interlaced ? "yes" : "no");
   double gamma = 0;
-  if (png_get_gAMA(reader.png, reader.info, &gamma) != 0) lines.AddFormat("        Gamma: %.5f", gamma);
+  if (png_get_gAMA(reader.png, reader.info, &gamma) != 0)
+    lines.AddFormat("        Gamma: %.5f", gamma);
   int intent = 0;
   if (png_get_sRGB(reader.png, reader.info, &intent) != 0) lines.Add("  Color space: sRGB");
 }
 
 void AddMetadataLines(const PictureRecord& picture, DetailLines& lines) {
   const PictureMetadata& metadata = picture.metadata;
-  if (metadata.dpiX > 0) lines.AddFormat("   Resolution: %.0f x %.0f dpi", metadata.dpiX, metadata.dpiY);
+  if (metadata.dpiX > 0)
+    lines.AddFormat("   Resolution: %.0f x %.0f dpi", metadata.dpiX, metadata.dpiY);
   if (!metadata.icc.empty()) lines.AddFormat("  ICC profile: %zu bytes", metadata.icc.size());
   if (!metadata.exif.empty()) lines.AddFormat("         EXIF: %zu bytes", metadata.exif.size());
   if (!metadata.xmp.empty()) lines.AddFormat("          XMP: %zu bytes", metadata.xmp.size());
@@ -451,29 +480,34 @@ void AddChunkLines(std::span<const uint8_t> file, DetailLines& lines) {
   lines.AddFormat("       Chunks: %d, %d of pixels", count, pixels);
 }
 
-// Whether there are texts that somebody wrote, beside those that travel with the picture; programs write the others.
+// Whether there are texts that somebody wrote, beside those that travel with the picture; programs
+// write the others.
 bool HoldsFurtherTexts(std::span<const uint8_t> file) {
   constexpr std::string_view kOthers[] = {kPngXmpKeyword, "Comment", "Software", "Creation Time"};
   PngChunks chunks(file);
   PngChunk chunk;
   while (chunks.Next(chunk)) {
     if (chunk.type != "tEXt" && chunk.type != "zTXt" && chunk.type != "iTXt") continue;
-    const std::string_view text(reinterpret_cast<const char*>(chunk.data.data()), chunk.data.size());
+    const std::string_view text(reinterpret_cast<const char*>(chunk.data.data()),
+                                chunk.data.size());
     const std::string_view key = text.substr(0, text.find('\0'));
-    if (!key.starts_with("date:") && std::ranges::find(kOthers, key) == std::end(kOthers)) return true;
+    if (!key.starts_with("date:") && std::ranges::find(kOthers, key) == std::end(kOthers))
+      return true;
   }
   return false;
 }
 
 }  // namespace
 
-Status DescribePng(std::span<const uint8_t> file, const ReadOptions& options, PictureRecord& picture) {
+Status DescribePng(std::span<const uint8_t> file, const ReadOptions& options,
+                   PictureRecord& picture) {
   PngReader reader(file);
   PngLayout layout;
   return Describe(reader, file, layout, options, picture);
 }
 
-Status DecodePng(std::span<const uint8_t> file, const ReadOptions& options, PictureRecord& picture) {
+Status DecodePng(std::span<const uint8_t> file, const ReadOptions& options,
+                 PictureRecord& picture) {
   PngReader reader(file);
   PngLayout layout;
   RETURN_IF_BAD(Describe(reader, file, layout, options, picture));

@@ -9,8 +9,8 @@
 
 namespace fotomill {
 
-// Portable Network Graphics. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when the file is cut short,
-// MemoryAllocationError (6).
+// Portable Network Graphics. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when
+// the file is cut short, MemoryAllocationError (6).
 Status PngInfo(PictureRecord& picture, const ReadRequest& request);
 Status PngRead(PictureRecord& picture, const ReadRequest& request);
 // Also ErrorCreatingFile (10), ErrorWritingFile (11).
@@ -18,7 +18,8 @@ Status PngWrite(PictureRecord& picture, const WriteOptions& options);
 Status PngDetails(PictureRecord& picture);
 
 // The same for a file that lies in memory, as containers hold them. Statuses as above.
-Status DescribePng(std::span<const uint8_t> file, const ReadOptions& options, PictureRecord& picture);
+Status DescribePng(std::span<const uint8_t> file, const ReadOptions& options,
+                   PictureRecord& picture);
 // A PNG file in memory: facts and pixels at once.
 Status DecodePng(std::span<const uint8_t> file, const ReadOptions& options, PictureRecord& picture);
 // Appends a PNG file of the picture's pixels, without metadata, to `out`.

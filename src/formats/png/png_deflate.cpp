@@ -21,14 +21,18 @@ namespace fotomill {
 
 namespace {
 
-constexpr uint64_t kBandBytes = uint64_t{4} << 20;  // of filtered rows: large enough to cost nothing, small enough to share out
+// of filtered rows: large enough to cost nothing, small enough to share out
+constexpr uint64_t kBandBytes = uint64_t{4} << 20;
 constexpr unsigned kMostThreads = 16;
-// The best level searches for the cheapest coding, which is 2 to 6 % smaller than zlib's best, in every other band: that
-// makes up for the bands between, which are up to 1 % larger than zlib's, and takes well below half of its time.
+// The best level searches for the cheapest coding, which is 2 to 6 % smaller than zlib's best, in
+// every other band: that makes up for the bands between, which are up to 1 % larger than zlib's,
+// and takes well below half of its time.
 constexpr int kSearchingLevel = 10;
 
 struct CompressorDeleter {
-  void operator()(libdeflate_compressor* compressor) const { libdeflate_free_compressor(compressor); }
+  void operator()(libdeflate_compressor* compressor) const {
+    libdeflate_free_compressor(compressor);
+  }
 };
 using Compressor = std::unique_ptr<libdeflate_compressor, CompressorDeleter>;
 
@@ -41,8 +45,9 @@ struct Band {
   bool done = false;
 };
 
-// Makes the last block of a deflate stream an inner one and appends an empty stored block, which ends at a byte, so
-// that another stream can follow. Where the block begins, an inflater says that stops at each one.
+// Makes the last block of a deflate stream an inner one and appends an empty stored block, which
+// ends at a byte, so that another stream can follow. Where the block begins, an inflater says that
+// stops at each one.
 bool OpenEnd(const Band& band, uint8_t* stream, uint64_t& size, std::vector<uint8_t>& discarded) {
   constexpr int kBitsLeft = 63, kInLastBlock = 64, kAtBlockEnd = 128;
   z_stream inflater = {};
@@ -56,7 +61,8 @@ bool OpenEnd(const Band& band, uint8_t* stream, uint64_t& size, std::vector<uint
     inflater.avail_out = static_cast<uInt>(discarded.size());
     result = inflate(&inflater, Z_BLOCK);
     if ((inflater.data_type & kAtBlockEnd) == 0) continue;
-    const uint64_t place = 8 * (size - inflater.avail_in) - static_cast<uint64_t>(inflater.data_type & kBitsLeft);
+    const uint64_t place =
+        8 * (size - inflater.avail_in) - static_cast<uint64_t>(inflater.data_type & kBitsLeft);
     ((inflater.data_type & kInLastBlock) != 0 ? end : lastBlock) = place;
   }
   inflateEnd(&inflater);
@@ -78,10 +84,13 @@ class BandMaker {
   BandMaker(const PngRows& rows, bool filtered, int32_t level)
       : rows_(rows), filtered_(filtered), level_(std::clamp(level, 0, 9)) {
     const uint64_t perBand = std::max<uint64_t>(kBandBytes / (rows.rowBytes + 1), 1);
-    bandRows_ = static_cast<int32_t>(std::min<uint64_t>(perBand, static_cast<uint64_t>(rows.height)));
+    bandRows_ =
+        static_cast<int32_t>(std::min<uint64_t>(perBand, static_cast<uint64_t>(rows.height)));
   }
   int32_t Bands() const { return (rows_.height + bandRows_ - 1) / bandRows_; }
-  int LevelOf(int32_t index) const { return level_ == 9 && index % 2 == 0 ? kSearchingLevel : level_; }
+  int LevelOf(int32_t index) const {
+    return level_ == 9 && index % 2 == 0 ? kSearchingLevel : level_;
+  }
   int32_t EndOf(int32_t index) const { return std::min((index + 1) * bandRows_, rows_.height); }
 
   void Make(int32_t index, Band& band) const {
@@ -95,7 +104,8 @@ class BandMaker {
     constexpr uint64_t kEnd = 8;
     const uint64_t most = libdeflate_deflate_compress_bound(compressor.get(), band.rawSize);
     if (!band.deflated.Allocate(most + kEnd, platform::Fill::Unset)) return;
-    band.size = libdeflate_deflate_compress(compressor.get(), raw.Data(), band.rawSize, band.deflated.Data(), most);
+    band.size = libdeflate_deflate_compress(compressor.get(), raw.Data(), band.rawSize,
+                                            band.deflated.Data(), most);
     band.adler = libdeflate_adler32(1, raw.Data(), band.rawSize);
     if (band.size == 0) return;
     if (last < rows_.height) {
@@ -136,7 +146,9 @@ class BandMaker {
 class BandQueue {
  public:
   BandQueue(const BandMaker& maker, unsigned threads)
-      : maker_(maker), slots_(2 * threads), helpers_(WorkerPool::Shared(), threads - 1, [this] { return Help(); }) {}
+      : maker_(maker),
+        slots_(2 * threads),
+        helpers_(WorkerPool::Shared(), threads - 1, [this] { return Help(); }) {}
   ~BandQueue() {
     {
       const std::lock_guard lock(mutex_);
@@ -147,8 +159,8 @@ class BandQueue {
   BandQueue(const BandQueue&) = delete;
   BandQueue& operator=(const BandQueue&) = delete;
 
-  // Band `index`, made here when nobody has begun it; it lives until the next one is taken. Bands are taken in order, each
-  // once.
+  // Band `index`, made here when nobody has begun it; it lives until the next one is taken. Bands
+  // are taken in order, each once.
   Band& Take(int32_t index) {
     std::unique_lock lock(mutex_);
     if (index > 0) Slot(index - 1) = Band();  // its slot is free for another
@@ -162,9 +174,11 @@ class BandQueue {
 
  private:
   Band& Slot(int32_t index) { return slots_[static_cast<size_t>(index) % slots_.size()]; }
-  // Begins the next band if there is a slot for it; false when there is nothing to begin. Unlocked while it works.
+  // Begins the next band if there is a slot for it; false when there is nothing to begin. Unlocked
+  // while it works.
   bool MakeNext(std::unique_lock<std::mutex>& lock) {
-    if (begun_ >= maker_.Bands() || begun_ >= taken_ + static_cast<int32_t>(slots_.size())) return false;
+    if (begun_ >= maker_.Bands() || begun_ >= taken_ + static_cast<int32_t>(slots_.size()))
+      return false;
     Band& band = Slot(begun_);
     const int32_t index = begun_++;
     band = Band();
@@ -195,7 +209,8 @@ class BandQueue {
 };
 
 // One chunk, given in parts.
-void WriteChunk(ByteWriter& out, std::span<const uint8_t> head, std::span<const uint8_t> body, std::span<const uint8_t> tail) {
+void WriteChunk(ByteWriter& out, std::span<const uint8_t> head, std::span<const uint8_t> body,
+                std::span<const uint8_t> tail) {
   constexpr uint8_t kType[] = {'I', 'D', 'A', 'T'};
   uint32_t crc = libdeflate_crc32(0, kType, sizeof kType);
   out.Be32(static_cast<uint32_t>(head.size() + body.size() + tail.size()));
@@ -212,10 +227,12 @@ void WriteChunk(ByteWriter& out, std::span<const uint8_t> head, std::span<const 
 
 Status WritePngPixels(const PngRows& rows, bool filtered, int32_t level, ByteWriter& out,
                       const std::function<Status(int32_t)>& report) {
-  if (rows.rowBytes > limits.packedBlockBytes / 8) return Status::MemoryAllocationError;  // a band takes several rows' room
+  // a band takes several rows' room
+  if (rows.rowBytes > limits.packedBlockBytes / 8) return Status::MemoryAllocationError;
   const BandMaker maker(rows, filtered, level);
   const int32_t bands = maker.Bands();
-  BandQueue queue(maker, std::min({WorkerPool::Shared().Cores(), kMostThreads, static_cast<unsigned>(bands)}));
+  BandQueue queue(
+      maker, std::min({WorkerPool::Shared().Cores(), kMostThreads, static_cast<unsigned>(bands)}));
   constexpr uint8_t kZlibHead[] = {0x78, 0xDA};  // deflate with a window of 32 KB, best compression
   uLong adler = 1;
   for (int32_t i = 0; i < bands; ++i) {
@@ -225,10 +242,12 @@ Status WritePngPixels(const PngRows& rows, bool filtered, int32_t level, ByteWri
     const uint8_t check[] = {static_cast<uint8_t>(adler >> 24), static_cast<uint8_t>(adler >> 16),
                              static_cast<uint8_t>(adler >> 8), static_cast<uint8_t>(adler)};
     const std::span<const uint8_t> none;
-    WriteChunk(out, i == 0 ? std::span<const uint8_t>(kZlibHead) : none, band.deflated.Bytes().first(band.size),
+    WriteChunk(out, i == 0 ? std::span<const uint8_t>(kZlibHead) : none,
+               band.deflated.Bytes().first(band.size),
                i == bands - 1 ? std::span<const uint8_t>(check) : none);
     if (out.Failed()) return Status::ErrorWritingFile;
-    for (int32_t y = i == 0 ? 0 : maker.EndOf(i - 1); y < maker.EndOf(i); ++y) RETURN_IF_BAD(report(y));
+    for (int32_t y = i == 0 ? 0 : maker.EndOf(i - 1); y < maker.EndOf(i); ++y)
+      RETURN_IF_BAD(report(y));
   }
   return Status::Ok;
 }

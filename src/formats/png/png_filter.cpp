@@ -22,7 +22,8 @@ template <size_t kBytes>
 void UndoSub(uint8_t* row, size_t size) {
   uint8_t left[kBytes] = {};
   for (size_t i = 0; i + kBytes <= size; i += kBytes) {
-    for (size_t k = 0; k < kBytes; ++k) left[k] = row[i + k] = static_cast<uint8_t>(row[i + k] + left[k]);
+    for (size_t k = 0; k < kBytes; ++k)
+      left[k] = row[i + k] = static_cast<uint8_t>(row[i + k] + left[k]);
   }
 }
 
@@ -41,7 +42,8 @@ void UndoPaeth(uint8_t* row, const uint8_t* above, size_t size) {
   uint8_t left[kBytes] = {}, corner[kBytes] = {};
   for (size_t i = 0; i + kBytes <= size; i += kBytes) {
     for (size_t k = 0; k < kBytes; ++k) {
-      left[k] = row[i + k] = static_cast<uint8_t>(row[i + k] + Nearest(left[k], above[i + k], corner[k]));
+      left[k] = row[i + k] =
+          static_cast<uint8_t>(row[i + k] + Nearest(left[k], above[i + k], corner[k]));
       corner[k] = above[i + k];
     }
   }
@@ -58,13 +60,16 @@ void UndoOf(PngFilter filter, uint8_t* row, const uint8_t* above, size_t size) {
   if (filter == PngFilter::Paeth) UndoPaeth<kBytes>(row, above, size);
 }
 
-// Each writes the differences of a row from something and answers the sum of how far they are from 0, as signed bytes.
+// Each writes the differences of a row from something and answers the sum of how far they are from
+// 0, as signed bytes.
 struct FilterKernels {
   uint64_t (*none)(const uint8_t* row, size_t size);
-  uint64_t (*sub)(const uint8_t* row, const uint8_t* left, size_t size, uint8_t* target);  // also serves for Up
-  uint64_t (*average)(const uint8_t* row, const uint8_t* left, const uint8_t* above, size_t size, uint8_t* target);
-  uint64_t (*paeth)(const uint8_t* row, const uint8_t* left, const uint8_t* above, const uint8_t* corner, size_t size,
-                    uint8_t* target);
+  // also serves for Up
+  uint64_t (*sub)(const uint8_t* row, const uint8_t* left, size_t size, uint8_t* target);
+  uint64_t (*average)(const uint8_t* row, const uint8_t* left, const uint8_t* above, size_t size,
+                      uint8_t* target);
+  uint64_t (*paeth)(const uint8_t* row, const uint8_t* left, const uint8_t* above,
+                    const uint8_t* corner, size_t size, uint8_t* target);
 };
 
 namespace baseline {
@@ -82,8 +87,8 @@ inline __m128i LoadPixel(const uint8_t* source) {
   return _mm_cvtepu8_epi16(_mm_cvtsi32_si128(bytes));
 }
 
-// Pixels of 3 or 4 bytes, one 16-bit lane for each byte. A pixel is stored with what lies behind it, which is loaded
-// before.
+// Pixels of 3 or 4 bytes, one 16-bit lane for each byte. A pixel is stored with what lies behind
+// it, which is loaded before.
 template <size_t kBytes>
 void UndoPaeth(uint8_t* row, const uint8_t* above, size_t size) {
   __m128i left = _mm_setzero_si128(), corner = left, next = LoadPixel(row);
@@ -125,7 +130,8 @@ bool UndoPaethFast(uint8_t* row, const uint8_t* above, size_t size, size_t pixel
 
 }  // namespace
 
-bool UndoPngFilter(uint8_t number, uint8_t* row, const uint8_t* above, size_t size, size_t pixelBytes) {
+bool UndoPngFilter(uint8_t number, uint8_t* row, const uint8_t* above, size_t size,
+                   size_t pixelBytes) {
   const auto filter = static_cast<PngFilter>(number);
   if (filter > PngFilter::Paeth) return false;
   if (filter == PngFilter::Up) UndoUp(row, above, size);
@@ -154,7 +160,8 @@ void PngFilterChooser::FilterRow(const uint8_t* row, const uint8_t* above, uint8
     filter = candidate;
     tried_.swap(best_);
   };
-  // The first pixel has none to its left: there Sub is the value, Average half of what is above, Paeth what is above.
+  // The first pixel has none to its left: there Sub is the value, Average half of what is above,
+  // Paeth what is above.
   const auto sumHead = [&](auto predict) {
     uint64_t sum = 0;
     for (size_t i = 0; i < head; ++i) {
@@ -169,7 +176,8 @@ void PngFilterChooser::FilterRow(const uint8_t* row, const uint8_t* above, uint8
   sum = sumHead([&](size_t i) { return above[i] / 2; });
   keep(PngFilter::Average, sum + kernels.average(body, row, aboveBody, rest, tried_.data() + head));
   sum = sumHead([&](size_t i) { return above[i]; });
-  keep(PngFilter::Paeth, sum + kernels.paeth(body, row, aboveBody, above, rest, tried_.data() + head));
+  keep(PngFilter::Paeth,
+       sum + kernels.paeth(body, row, aboveBody, above, rest, tried_.data() + head));
   *target = static_cast<uint8_t>(filter);
   std::memcpy(target + 1, filter == PngFilter::None ? row : best_.data(), size_);
 }

@@ -12,7 +12,8 @@ inline constexpr double kPngInchesPerMetre = 39.3701;  // PNG states pixels per 
 [[noreturn]] inline void OnPngError(png_structp png, png_const_charp) { png_longjmp(png, 1); }
 inline void OnPngWarning(png_structp, png_const_charp) {}  // nothing is printed
 
-// Runs library calls; false when one of them failed. Nothing with a destructor may live inside `action`.
+// Runs library calls; false when one of them failed. Nothing with a destructor may live inside
+// `action`.
 template <typename Action>
 bool PngGuarded(png_structp png, Action action) {
   if (setjmp(png_jmpbuf(png)) != 0) return false;

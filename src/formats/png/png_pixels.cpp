@@ -17,11 +17,14 @@ namespace fotomill {
 namespace {
 
 struct DecompressorDeleter {
-  void operator()(libdeflate_decompressor* decompressor) const { libdeflate_free_decompressor(decompressor); }
+  void operator()(libdeflate_decompressor* decompressor) const {
+    libdeflate_free_decompressor(decompressor);
+  }
 };
 
 // The data of all pixel chunks, which must be whole and follow each other.
-bool FindPixelChunks(std::span<const uint8_t> file, std::vector<std::span<const uint8_t>>& parts, uint64_t& size) {
+bool FindPixelChunks(std::span<const uint8_t> file, std::vector<std::span<const uint8_t>>& parts,
+                     uint64_t& size) {
   PngChunks chunks(file);
   PngChunk chunk;
   while (chunks.Next(chunk)) {
@@ -40,8 +43,8 @@ bool FindPixelChunks(std::span<const uint8_t> file, std::vector<std::span<const 
 }
 
 // The parts as one, without a copy where there is only one.
-bool Join(const std::vector<std::span<const uint8_t>>& parts, uint64_t size, platform::MemoryBlock& copy,
-          std::span<const uint8_t>& joined) {
+bool Join(const std::vector<std::span<const uint8_t>>& parts, uint64_t size,
+          platform::MemoryBlock& copy, std::span<const uint8_t>& joined) {
   joined = parts[0];
   if (parts.size() == 1) return true;
   if (!copy.Allocate(size, platform::Fill::Unset)) return false;
@@ -53,26 +56,32 @@ bool Join(const std::vector<std::span<const uint8_t>>& parts, uint64_t size, pla
 
 }  // namespace
 
-bool PngPixels::Inflate(std::span<const uint8_t> file, uint64_t rowBytes, uint32_t pixelBits, int32_t height, uint64_t room) {
+bool PngPixels::Inflate(std::span<const uint8_t> file, uint64_t rowBytes, uint32_t pixelBits,
+                        int32_t height, uint64_t room) {
   rowBytes_ = rowBytes;
   pixelBytes_ = std::max(1u, pixelBits / 8);
   const auto rows = static_cast<uint64_t>(height);
-  constexpr uint64_t kShare = 4;  // of what a picture may take, since that and the deflated data are held as well
+  // of what a picture may take, since that and the deflated data are held as well
+  constexpr uint64_t kShare = 4;
   if (rowBytes == 0 || rowBytes + 1 > limits.packedBlockBytes / kShare / rows) return false;
   const uint64_t size = (rowBytes + 1) * rows;
   std::vector<std::span<const uint8_t>> parts;
   uint64_t packed = 0;
   constexpr uint64_t kBestRatio = 1032;  // of deflate
   if (!FindPixelChunks(file, parts, packed) || size / kBestRatio > packed) return false;
-  if (size + 2 * rowBytes > room || (parts.size() > 1 && packed > room - size - 2 * rowBytes)) return false;
+  if (size + 2 * rowBytes > room || (parts.size() > 1 && packed > room - size - 2 * rowBytes))
+    return false;
   platform::MemoryBlock copy;
   std::span<const uint8_t> joined;
-  const std::unique_ptr<libdeflate_decompressor, DecompressorDeleter> decompressor(libdeflate_alloc_decompressor());
+  const std::unique_ptr<libdeflate_decompressor, DecompressorDeleter> decompressor(
+      libdeflate_alloc_decompressor());
   if (decompressor == nullptr || !Join(parts, packed, copy, joined)) return false;
-  if (!filtered_.Allocate(size + kPngSlack, platform::Fill::Unset) || !firstAbove_.Allocate(rowBytes + kPngSlack)) return false;
+  if (!filtered_.Allocate(size + kPngSlack, platform::Fill::Unset) ||
+      !firstAbove_.Allocate(rowBytes + kPngSlack))
+    return false;
   std::memset(filtered_.Data() + size, 0, kPngSlack);
-  return libdeflate_zlib_decompress(decompressor.get(), joined.data(), joined.size(), filtered_.Data(), size, nullptr) ==
-         LIBDEFLATE_SUCCESS;
+  return libdeflate_zlib_decompress(decompressor.get(), joined.data(), joined.size(),
+                                    filtered_.Data(), size, nullptr) == LIBDEFLATE_SUCCESS;
 }
 
 const uint8_t* PngPixels::NextRow() {

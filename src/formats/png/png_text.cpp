@@ -18,19 +18,24 @@ namespace fotomill {
 namespace {
 
 struct DecompressorDeleter {
-  void operator()(libdeflate_decompressor* decompressor) const { libdeflate_free_decompressor(decompressor); }
+  void operator()(libdeflate_decompressor* decompressor) const {
+    libdeflate_free_decompressor(decompressor);
+  }
 };
 
 // Tries larger and larger rooms: nothing tells how long the text is.
 std::vector<uint8_t> Inflated(std::span<const uint8_t> data, uint64_t most) {
   constexpr uint64_t kFirst = 16 * 1024;
-  const std::unique_ptr<libdeflate_decompressor, DecompressorDeleter> decompressor(libdeflate_alloc_decompressor());
+  const std::unique_ptr<libdeflate_decompressor, DecompressorDeleter> decompressor(
+      libdeflate_alloc_decompressor());
   if (decompressor == nullptr) return {};
-  for (uint64_t room = std::min(std::max<uint64_t>(kFirst, 4 * data.size()), most);; room = std::min(4 * room, most)) {
+  for (uint64_t room = std::min(std::max<uint64_t>(kFirst, 4 * data.size()), most);;
+       room = std::min(4 * room, most)) {
     platform::MemoryBlock text;
     if (!text.Allocate(room, platform::Fill::Unset)) return {};
     size_t size = 0;
-    switch (libdeflate_zlib_decompress(decompressor.get(), data.data(), data.size(), text.Data(), room, &size)) {
+    switch (libdeflate_zlib_decompress(decompressor.get(), data.data(), data.size(), text.Data(),
+                                       room, &size)) {
       case LIBDEFLATE_SUCCESS: return {text.Data(), text.Data() + size};
       case LIBDEFLATE_INSUFFICIENT_SPACE: break;
       default: return {};
@@ -42,14 +47,16 @@ std::vector<uint8_t> Inflated(std::span<const uint8_t> data, uint64_t most) {
 // What follows the first zero byte; empty without one.
 std::span<const uint8_t> BehindZero(std::span<const uint8_t> data) {
   const auto zero = std::ranges::find(data, uint8_t{0});
-  return zero == data.end() ? std::span<const uint8_t>() : data.subspan(static_cast<size_t>(zero - data.begin()) + 1);
+  return zero == data.end() ? std::span<const uint8_t>()
+                            : data.subspan(static_cast<size_t>(zero - data.begin()) + 1);
 }
 
 }  // namespace
 
 std::string_view PngTextKeyword(const PngChunk& chunk) {
   constexpr size_t kMost = 79;
-  const std::string_view start(reinterpret_cast<const char*>(chunk.data.data()), std::min(chunk.data.size(), kMost + 1));
+  const std::string_view start(reinterpret_cast<const char*>(chunk.data.data()),
+                               std::min(chunk.data.size(), kMost + 1));
   return start.substr(0, start.find('\0'));
 }
 
@@ -63,7 +70,8 @@ std::vector<uint8_t> PngTextOf(const PngChunk& chunk, uint64_t most) {
   text = text.subspan(head);
   if (chunk.type == "iTXt") text = BehindZero(BehindZero(text));
   if (deflated) return Inflated(text, most);
-  return text.size() <= most ? std::vector<uint8_t>(text.begin(), text.end()) : std::vector<uint8_t>();
+  return text.size() <= most ? std::vector<uint8_t>(text.begin(), text.end())
+                             : std::vector<uint8_t>();
 }
 
 }  // namespace fotomill

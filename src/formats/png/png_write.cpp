@@ -1,5 +1,6 @@
-// The PNG writer keeps the depth: palettes of 1, 4 and 8 bits (grays as gray), RGB, or RGBA with an alpha plane. libpng writes
-// everything in front of the pixels, png_deflate.cpp the pixels, compressed as PngCompression says.
+// The PNG writer keeps the depth: palettes of 1, 4 and 8 bits (grays as gray), RGB, or RGBA with an
+// alpha plane. libpng writes everything in front of the pixels, png_deflate.cpp the pixels,
+// compressed as PngCompression says.
 #include <algorithm>
 #include <cmath>
 #include <cstring>
@@ -54,14 +55,16 @@ int ColorType(const PictureRecord& picture) {
 void SetMetadata(const PngWriter& writer, const PictureRecord& picture, bool keep, uint8_t& lost) {
   const PictureMetadata& metadata = picture.metadata;
   if (metadata.dpiX > 0 && metadata.dpiY > 0) {
-    png_set_pHYs(writer.png, writer.info, static_cast<png_uint_32>(std::lround(metadata.dpiX * kPngInchesPerMetre)),
-                 static_cast<png_uint_32>(std::lround(metadata.dpiY * kPngInchesPerMetre)), PNG_RESOLUTION_METER);
+    png_set_pHYs(writer.png, writer.info,
+                 static_cast<png_uint_32>(std::lround(metadata.dpiX * kPngInchesPerMetre)),
+                 static_cast<png_uint_32>(std::lround(metadata.dpiY * kPngInchesPerMetre)),
+                 PNG_RESOLUTION_METER);
   }
   if (!keep) return;
   if (!metadata.icc.empty()) {
     png_set_benign_errors(writer.png, 1);  // an odd profile is left out, not the picture
-    png_set_iCCP(writer.png, writer.info, "ICC profile", PNG_COMPRESSION_TYPE_BASE, metadata.icc.data(),
-                 static_cast<png_uint_32>(metadata.icc.size()));
+    png_set_iCCP(writer.png, writer.info, "ICC profile", PNG_COMPRESSION_TYPE_BASE,
+                 metadata.icc.data(), static_cast<png_uint_32>(metadata.icc.size()));
     if (png_get_valid(writer.png, writer.info, PNG_INFO_iCCP) == 0) lost |= kLostIcc;
   }
   if (!metadata.exif.empty()) {
@@ -87,8 +90,9 @@ int DepthOf(const PictureRecord& picture) {
 void SetHeader(const PngWriter& writer, const PictureRecord& picture) {
   const PackedImage& image = picture.image;
   const int type = ColorType(picture);
-  png_set_IHDR(writer.png, writer.info, static_cast<png_uint_32>(image.Width()), static_cast<png_uint_32>(image.Height()),
-               DepthOf(picture), type, PNG_INTERLACE_NONE, PNG_COMPRESSION_TYPE_BASE, PNG_FILTER_TYPE_BASE);
+  png_set_IHDR(writer.png, writer.info, static_cast<png_uint_32>(image.Width()),
+               static_cast<png_uint_32>(image.Height()), DepthOf(picture), type, PNG_INTERLACE_NONE,
+               PNG_COMPRESSION_TYPE_BASE, PNG_FILTER_TYPE_BASE);
   if (type == PNG_COLOR_TYPE_PALETTE) {
     png_color colors[256];
     for (size_t i = 0; i < static_cast<size_t>(image.Colors()); ++i) {
@@ -98,7 +102,8 @@ void SetHeader(const PngWriter& writer, const PictureRecord& picture) {
   }
 }
 
-// A row of red, green, blue, alpha. The colors are put at its end first and go to their places from the left on.
+// A row of red, green, blue, alpha. The colors are put at its end first and go to their places from
+// the left on.
 void MergeRow(const BgrRows& colors, const PackedImage& alpha, int32_t y, uint8_t* target) {
   const auto width = static_cast<size_t>(alpha.Width());
   const uint8_t* source = target + width;
@@ -131,9 +136,11 @@ Status WritePixels(const PictureRecord& picture, int32_t compression, ByteWriter
       std::memcpy(row, image.Row(y).data(), rows.rowBytes);
     }
   };
-  const int type = ColorType(picture);  // palettes and pixels within a byte have no neighbours to differ from
+  // palettes and pixels within a byte have no neighbours to differ from
+  const int type = ColorType(picture);
   const bool filtered = type != PNG_COLOR_TYPE_PALETTE && DepthOf(picture) == 8;
-  return WritePngPixels(rows, filtered, compression, out, [&](int32_t y) { return picture.ReportRow(y); });
+  return WritePngPixels(rows, filtered, compression, out,
+                        [&](int32_t y) { return picture.ReportRow(y); });
 }
 
 void WriteEnd(ByteWriter& out) {
@@ -144,7 +151,8 @@ void WriteEnd(ByteWriter& out) {
 }
 
 // `keep`: whether metadata and comment go along; `lost`: what of them could not.
-Status WriteAll(PngWriter& writer, const PictureRecord& picture, const EncodeOptions& options, bool keep, uint8_t& lost) {
+Status WriteAll(PngWriter& writer, const PictureRecord& picture, const EncodeOptions& options,
+                bool keep, uint8_t& lost) {
   const std::string xmp(picture.metadata.xmp.begin(), picture.metadata.xmp.end());
   const std::string comment(picture.comment.begin(), picture.comment.end());
   const bool written = PngGuarded(writer.png, [&] {

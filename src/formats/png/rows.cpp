@@ -15,7 +15,8 @@ using namespace std::string_view_literals;
 
 constexpr Signature kSignatures[] = {{0, "\x89PNG\r\n\x1a\n"sv, "PNG"}};
 
-constexpr FormatSetting kKeys[] = {{"PngCompression", TrLater("Compression, 0 (fastest) to 9 (smallest)")}};
+constexpr FormatSetting kKeys[] = {
+    {"PngCompression", TrLater("Compression, 0 (fastest) to 9 (smallest)")}};
 constexpr FormatSettings kSettings = {"PNG", "OverridePngBox", TrLater("PNG"), kKeys};
 
 std::string PngVersion() { return PNG_LIBPNG_VER_STRING; }
@@ -36,8 +37,8 @@ constexpr FormatEntry kRows[] = {{
     .extension = "PNG"sv,
     .description = "(PNG) Portable Network Graphics"sv,
     .enabled = 1,
-    .flags = FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_PAGES | FMT_FRAMES | FMT_PNG | FMT_LAYERED | FMT_TRANSPARENT |
-             FMT_SAVE_ANYWAY | FMT_ALPHA,
+    .flags = FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_PAGES | FMT_FRAMES | FMT_PNG |
+             FMT_LAYERED | FMT_TRANSPARENT | FMT_SAVE_ANYWAY | FMT_ALPHA,
     .canRead = true,
     .canWrite = true,
     .signatures = kSignatures,

@@ -9,17 +9,17 @@
 //       12    8  least and greatest sample, not used
 //       20    4  nothing
 //       24   80  name
-//      104    4  color map: 0 none; 1 three-bit colors and 2 a map elsewhere, both obsolete; 3 the file is a map
-//      108  404  nothing
-//      512       plain: the rows of the first channel from the bottom up, then those of the next
-//      512       run lengths: the offset of each such row (4 bytes each), then the length of each, then the rows' code
+//      104    4  color map: 0 none; 1 three-bit colors and 2 a map elsewhere, both obsolete; 3 the
+//      file is a map 108  404  nothing 512       plain: the rows of the first channel from the
+//      bottom up, then those of the next 512       run lengths: the offset of each such row (4
+//      bytes each), then the length of each, then the rows' code
 //
-// Channels are gray, gray and alpha, RGB, or RGB and alpha; more are passed over. Samples of two bytes come down to one,
-// rounded. Rows may share their code and lie in any order.
+// Channels are gray, gray and alpha, RGB, or RGB and alpha; more are passed over. Samples of two
+// bytes come down to one, rounded. Rows may share their code and lie in any order.
 //
-// The writer stores run lengths of one byte a sample: pictures of the gray ramp in one channel, everything else in three,
-// and a channel of alpha where the picture has some.
-// Source: P. Haeberli, "The SGI Image File Format, Version 1.00" (Silicon Graphics).
+// The writer stores run lengths of one byte a sample: pictures of the gray ramp in one channel,
+// everything else in three, and a channel of alpha where the picture has some. Source: P. Haeberli,
+// "The SGI Image File Format, Version 1.00" (Silicon Graphics).
 #include "formats/sgi/sgi.h"
 
 #include <vector>
@@ -52,7 +52,8 @@ struct SgiHeader {
   uint64_t PlainRowSize() const { return static_cast<uint64_t>(width) * sampleSize; }
 };
 
-// Ok; FileReadError for a short header, DamagedFile for what no such file can say, UnsupportedFormat, NoImages.
+// Ok; FileReadError for a short header, DamagedFile for what no such file can say,
+// UnsupportedFormat, NoImages.
 Status ParseHeader(std::span<const uint8_t> file, SgiHeader& header) {
   ByteReader bytes(file);
   const uint16_t magic = bytes.Be16();
@@ -68,11 +69,13 @@ Status ParseHeader(std::span<const uint8_t> file, SgiHeader& header) {
   if (!bytes.Ok()) return Status::FileReadError;
   if (dimensions < 3) header.channels = 1;
   if (dimensions == 1) header.height = 1;
-  const bool known = header.storage <= kRunLengths && (header.sampleSize == 1 || header.sampleSize == 2);
+  const bool known =
+      header.storage <= kRunLengths && (header.sampleSize == 1 || header.sampleSize == 2);
   if (!known || dimensions < 1 || dimensions > 3) return Status::DamagedFile;
   if (header.colorMap == kIsColorMap) return Status::NoImages;
   if (header.colorMap != kNoColorMap) return Status::UnsupportedFormat;
-  return header.width < 1 || header.height < 1 || header.channels < 1 ? Status::DamagedFile : Status::Ok;
+  return header.width < 1 || header.height < 1 || header.channels < 1 ? Status::DamagedFile
+                                                                      : Status::Ok;
 }
 
 void DescribePicture(const SgiHeader& header, PictureRecord& picture) {
@@ -81,7 +84,8 @@ void DescribePicture(const SgiHeader& header, PictureRecord& picture) {
   picture.height = header.height;
   picture.bitsPerPixel = header.channels == 1 ? 8 : 24;
   picture.imageBytes = EstimateImageBytes(picture.width, picture.height, picture.bitsPerPixel);
-  picture.alphaFlags = static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (header.Alpha() ? kHasAlpha : 0));
+  picture.alphaFlags =
+      static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (header.Alpha() ? kHasAlpha : 0));
   picture.simplified = header.sampleSize > 1 || header.channels > 4;
   if (header.channels == 1) {
     picture.palette = GrayRamp();
@@ -97,13 +101,16 @@ class RowTable {
   Status Open(std::span<const uint8_t> file, const SgiHeader& header) {
     file_ = file;
     header_ = &header;
-    const uint64_t least = header.storage == kPlain ? header.Rows() * header.PlainRowSize() : header.Rows() * 8;
+    const uint64_t least =
+        header.storage == kPlain ? header.Rows() * header.PlainRowSize() : header.Rows() * 8;
     return file.size() - kHeaderSize < least ? Status::FileReadError : Status::Ok;
   }
 
-  // Decodes row `y`, counted from the bottom, of a channel. FileReadError when its data are not all there.
+  // Decodes row `y`, counted from the bottom, of a channel. FileReadError when its data are not all
+  // there.
   Status Decode(uint64_t channel, int32_t y, std::span<uint8_t> row) const {
-    const uint64_t index = channel * static_cast<uint64_t>(header_->height) + static_cast<uint64_t>(y);
+    const uint64_t index =
+        channel * static_cast<uint64_t>(header_->height) + static_cast<uint64_t>(y);
     ByteReader bytes(file_);
     if (header_->storage == kPlain) {
       bytes.Seek(kHeaderSize + index * header_->PlainRowSize());
@@ -133,8 +140,8 @@ class RowTable {
   const SgiHeader* header_ = nullptr;
 };
 
-Status ReadRows(const RowTable& table, const SgiHeader& header, const PictureRecord& picture, PackedImage& image,
-                PackedImage& alpha) {
+Status ReadRows(const RowTable& table, const SgiHeader& header, const PictureRecord& picture,
+                PackedImage& image, PackedImage& alpha) {
   const auto width = static_cast<size_t>(header.width);
   std::vector<uint8_t> planes(header.channels == 1 ? 0 : 3 * width);
   const std::span<uint8_t> red(planes.data(), planes.empty() ? 0 : width);
@@ -143,14 +150,16 @@ Status ReadRows(const RowTable& table, const SgiHeader& header, const PictureRec
     if (header.channels == 1) {
       RETURN_IF_BAD(table.Decode(0, y, row.first(width)));
     } else {
-      const std::span<uint8_t> green(red.data() + width, width), blue(red.data() + 2 * width, width);
+      const std::span<uint8_t> green(red.data() + width, width),
+          blue(red.data() + 2 * width, width);
       RETURN_IF_BAD(table.Decode(0, y, red));
       if (!header.Gray()) RETURN_IF_BAD(table.Decode(1, y, green));
       if (!header.Gray()) RETURN_IF_BAD(table.Decode(2, y, blue));
       const uint8_t* second = header.Gray() ? red.data() : green.data();
       MergeColors(header.Gray() ? red.data() : blue.data(), second, red.data(), width, row.data());
     }
-    if (header.Alpha()) RETURN_IF_BAD(table.Decode(header.Gray() ? 1 : 3, y, alpha.StoredRow(y).first(width)));
+    if (header.Alpha())
+      RETURN_IF_BAD(table.Decode(header.Gray() ? 1 : 3, y, alpha.StoredRow(y).first(width)));
     RETURN_IF_BAD(picture.ReportRow(y));
   }
   return Status::Ok;
@@ -179,7 +188,9 @@ void WriteHeader(ByteWriter& out, const PackedImage& image, uint16_t channels) {
 class ChannelRows {
  public:
   ChannelRows(const PictureRecord& picture, uint16_t channels)
-      : picture_(picture), colors_(channels >= 3 ? 3 : 1), room_(3 * static_cast<size_t>(picture.image.Width())) {}
+      : picture_(picture),
+        colors_(channels >= 3 ? 3 : 1),
+        room_(3 * static_cast<size_t>(picture.image.Width())) {}
 
   std::span<const uint8_t> Row(uint16_t channel, int32_t y) {
     const PackedImage& image = picture_.image;
@@ -219,7 +230,8 @@ Status WriteRows(ByteWriter& out, const PictureRecord& picture, uint16_t channel
   for (size_t index = 0; index < rows && !out.Failed(); ++index) {
     if (out.Position() > UINT32_MAX) return Status::UnsuitableImage;
     const auto y = static_cast<int32_t>(index % static_cast<size_t>(height));
-    const size_t length = EncodeSgiRow(source.Row(static_cast<uint16_t>(index / static_cast<size_t>(height)), y), code.data());
+    const size_t length = EncodeSgiRow(
+        source.Row(static_cast<uint16_t>(index / static_cast<size_t>(height)), y), code.data());
     PutBe32(table, index, out.Position());
     PutBe32(table, rows + index, length);
     out.Bytes(std::span(code).first(length));

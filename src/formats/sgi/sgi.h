@@ -6,8 +6,9 @@
 
 namespace fotomill {
 
-// Silicon Graphics images. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when data are cut short,
-// MemoryAllocationError (6), UnsupportedFormat (8) for the obsolete color maps, NoImages (20) for a file that is a color map.
+// Silicon Graphics images. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when
+// data are cut short, MemoryAllocationError (6), UnsupportedFormat (8) for the obsolete color maps,
+// NoImages (20) for a file that is a color map.
 Status SgiInfo(PictureRecord& picture, const ReadRequest& request);
 Status SgiRead(PictureRecord& picture, const ReadRequest& request);
 // Also UnsuitableImage (13) for sizes over 65535, ErrorCreatingFile (10), ErrorWritingFile (11).

@@ -75,7 +75,8 @@ bool DecodeWideSgiRow(std::span<const uint8_t> code, std::span<uint8_t> row) {
     if (count == 0) return true;
     const bool literal = (token & kLiteral) != 0;
     if (code.size() - at < (literal ? 2 * room : 2)) return false;
-    for (size_t i = 0; i < room; ++i) row[x + i] = RoundSgiSample(&code[at + (literal ? 2 * i : 0)]);
+    for (size_t i = 0; i < room; ++i)
+      row[x + i] = RoundSgiSample(&code[at + (literal ? 2 * i : 0)]);
     at += literal ? 2 * room : 2;
     x += room;
   }

@@ -11,13 +11,14 @@
 //       32       color map: all red values, all green ones, all blue ones
 //        .       rows from the top, each padded to 16 bits
 //
-// Pixels of 24 bits are blue, green, red, in files of type RGB red, green, blue; of 32 bits there is an unused byte in front.
-// Without a map, a bit that is set is black, and 8 bits are gray. In byte-encoded pixels 128 stands before a count n
-// and a value that comes n + 1 times; a count of 0 has no value and means 128 itself. Runs go on from row to row.
+// Pixels of 24 bits are blue, green, red, in files of type RGB red, green, blue; of 32 bits there
+// is an unused byte in front. Without a map, a bit that is set is black, and 8 bits are gray. In
+// byte-encoded pixels 128 stands before a count n and a value that comes n + 1 times; a count of 0
+// has no value and means 128 itself. Runs go on from row to row.
 //
-// The writer makes standard files without runs, which every reader takes: black and white in 1 bit, other palettes in 8 bits
-// with a map (grays without one), everything else in 24 bits.
-// Source: Sun Microsystems, SunOS Reference Manual, rasterfile(5).
+// The writer makes standard files without runs, which every reader takes: black and white in 1 bit,
+// other palettes in 8 bits with a map (grays without one), everything else in 24 bits. Source: Sun
+// Microsystems, SunOS Reference Manual, rasterfile(5).
 #include "formats/sunraster/ras.h"
 
 #include <algorithm>
@@ -50,7 +51,8 @@ struct RasHeader {
   uint64_t PixelOffset() const { return kHeaderSize + mapSize; }
 };
 
-// Ok; FileReadError for a short header, DamagedFile for what no such file can say, UnsupportedFormat.
+// Ok; FileReadError for a short header, DamagedFile for what no such file can say,
+// UnsupportedFormat.
 Status ParseHeader(std::span<const uint8_t> file, RasHeader& header) {
   ByteReader bytes(file);
   const uint32_t magic = bytes.Be32();
@@ -63,9 +65,12 @@ Status ParseHeader(std::span<const uint8_t> file, RasHeader& header) {
   header.mapSize = bytes.Be32();
   if (file.size() >= 4 && magic != kMagic) return Status::DamagedFile;
   if (!bytes.Ok()) return Status::FileReadError;
-  if (header.width < 1 || header.height < 1 || header.width > INT32_MAX || header.height > INT32_MAX) return Status::DamagedFile;
+  if (header.width < 1 || header.height < 1 || header.width > INT32_MAX ||
+      header.height > INT32_MAX)
+    return Status::DamagedFile;
   if (header.mapType > kRawMap) return Status::DamagedFile;
-  const bool depthKnown = header.bits == 1 || header.bits == 8 || header.bits == 24 || header.bits == 32;
+  const bool depthKnown =
+      header.bits == 1 || header.bits == 8 || header.bits == 24 || header.bits == 32;
   return depthKnown && header.type <= kRgb ? Status::Ok : Status::UnsupportedFormat;
 }
 
@@ -75,7 +80,8 @@ void ReadPalette(std::span<const uint8_t> file, const RasHeader& header, Palette
   if (header.bits > 8) return;
   if (header.bits == 8) palette = GrayRamp();
   if (header.bits == 1) std::swap_ranges(palette.begin(), palette.begin() + 3, palette.begin() + 3);
-  const uint64_t colors = std::min<uint64_t>(header.mapSize / 3, uint64_t{1} << header.bits), plane = header.mapSize / 3;
+  const uint64_t colors = std::min<uint64_t>(header.mapSize / 3, uint64_t{1} << header.bits),
+                 plane = header.mapSize / 3;
   ByteReader bytes(file);
   bytes.Seek(kHeaderSize);
   const auto map = bytes.Take(std::min<uint64_t>(header.mapSize, bytes.Left()));
@@ -85,8 +91,10 @@ void ReadPalette(std::span<const uint8_t> file, const RasHeader& header, Palette
   }
 }
 
-void DescribePicture(std::span<const uint8_t> file, const RasHeader& header, PictureRecord& picture) {
-  constexpr const char* kNames[] = {"Sun raster, old", "Sun raster", "Sun raster, byte-encoded", "Sun raster, RGB"};
+void DescribePicture(std::span<const uint8_t> file, const RasHeader& header,
+                     PictureRecord& picture) {
+  constexpr const char* kNames[] = {"Sun raster, old", "Sun raster", "Sun raster, byte-encoded",
+                                    "Sun raster, RGB"};
   picture.typeName.AssignCut(kNames[header.type]);
   picture.width = static_cast<int32_t>(header.width);
   picture.height = static_cast<int32_t>(header.height);
@@ -100,7 +108,10 @@ void DescribePicture(std::span<const uint8_t> file, const RasHeader& header, Pic
 class RowSource {
  public:
   RowSource(std::span<const uint8_t> pixels, const RasHeader& header)
-      : bytes_(pixels), encoded_(header.type == kByteEncoded), size_(header.RowSize()), row_(encoded_ ? size_ : 0) {}
+      : bytes_(pixels),
+        encoded_(header.type == kByteEncoded),
+        size_(header.RowSize()),
+        row_(encoded_ ? size_ : 0) {}
 
   // The next row; empty when the data are cut short. Valid until the next call.
   std::span<const uint8_t> Next() {
@@ -143,9 +154,15 @@ class RowSource {
 // Turns the bytes of a row into the picture's.
 using PutRow = void (*)(const uint8_t* source, size_t width, uint8_t* row);
 
-void CopyBits(const uint8_t* source, size_t width, uint8_t* row) { std::memcpy(row, source, (width + 7) / 8); }
-void CopyBytes(const uint8_t* source, size_t width, uint8_t* row) { std::memcpy(row, source, width); }
-void CopyColors(const uint8_t* source, size_t width, uint8_t* row) { std::memcpy(row, source, 3 * width); }
+void CopyBits(const uint8_t* source, size_t width, uint8_t* row) {
+  std::memcpy(row, source, (width + 7) / 8);
+}
+void CopyBytes(const uint8_t* source, size_t width, uint8_t* row) {
+  std::memcpy(row, source, width);
+}
+void CopyColors(const uint8_t* source, size_t width, uint8_t* row) {
+  std::memcpy(row, source, 3 * width);
+}
 void DropFirst(const uint8_t* source, size_t width, uint8_t* row) {
   for (size_t x = 0; x < width; ++x, source += 4, row += 3) std::memcpy(row, source + 1, 3);
 }
@@ -178,17 +195,22 @@ RasLayout ChooseLayout(const PictureRecord& picture) {
   const PackedImage& image = picture.image;
   if (image.Bits() == 24) return {};
   if (image.Bits() == 1) {
-    const bool blackFirst = std::ranges::all_of(std::span(picture.palette).first(3), [](uint8_t v) { return v == 0; }) &&
-                            std::ranges::all_of(std::span(picture.palette).subspan(3, 3), [](uint8_t v) { return v == 255; });
+    const bool blackFirst = std::ranges::all_of(std::span(picture.palette).first(3),
+                                                [](uint8_t v) { return v == 0; }) &&
+                            std::ranges::all_of(std::span(picture.palette).subspan(3, 3),
+                                                [](uint8_t v) { return v == 255; });
     if (blackFirst) return {1, false, true};
   }
   return {8, !(image.Bits() == 8 && picture.palette == GrayRamp()), false};
 }
 
-void WriteHead(ByteWriter& out, const PictureRecord& picture, const RasLayout& layout, uint64_t size) {
+void WriteHead(ByteWriter& out, const PictureRecord& picture, const RasLayout& layout,
+               uint64_t size) {
   const auto colors = static_cast<uint32_t>(layout.map ? picture.image.Colors() : 0);
-  for (const uint32_t field : {kMagic, static_cast<uint32_t>(picture.image.Width()), static_cast<uint32_t>(picture.image.Height()),
-                               layout.bits, static_cast<uint32_t>(size), kStandard, layout.map ? kRgbMap : kNoMap, 3 * colors}) {
+  for (const uint32_t field :
+       {kMagic, static_cast<uint32_t>(picture.image.Width()),
+        static_cast<uint32_t>(picture.image.Height()), layout.bits, static_cast<uint32_t>(size),
+        kStandard, layout.map ? kRgbMap : kNoMap, 3 * colors}) {
     out.Be32(field);
   }
   for (size_t c = 0; c < 3; ++c) {
@@ -196,10 +218,12 @@ void WriteHead(ByteWriter& out, const PictureRecord& picture, const RasLayout& l
   }
 }
 
-void MakeRow(const PackedImage& image, int32_t y, const RasLayout& layout, std::span<uint8_t> bytes) {
+void MakeRow(const PackedImage& image, int32_t y, const RasLayout& layout,
+             std::span<uint8_t> bytes) {
   const auto row = image.Row(y);
   if (layout.bits == 8 && image.Bits() < 8) {
-    for (int32_t x = 0; x < image.Width(); ++x) bytes[static_cast<size_t>(x)] = static_cast<uint8_t>(image.PixelAt(x, y));
+    for (int32_t x = 0; x < image.Width(); ++x)
+      bytes[static_cast<size_t>(x)] = static_cast<uint8_t>(image.PixelAt(x, y));
     return;
   }
   std::memcpy(bytes.data(), row.data(), std::min(bytes.size(), row.size()));

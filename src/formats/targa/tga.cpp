@@ -3,28 +3,29 @@
 //   offset size  field
 //        0    1  length of the identification text behind the header
 //        1    1  1: there is a color map
-//        2    1  type: 1 color-mapped, 2 true color, 3 gray; 9, 10, 11 the same in run-length packets
-//        3    2  first color map index
-//        5    2  color map entries
-//        7    1  bits of an entry: 15, 16, 24 or 32
-//        8    4  two origins, ignored
+//        2    1  type: 1 color-mapped, 2 true color, 3 gray; 9, 10, 11 the same in run-length
+//        packets 3    2  first color map index 5    2  color map entries 7    1  bits of an entry:
+//        15, 16, 24 or 32 8    4  two origins, ignored
 //       12    2  width
 //       14    2  height
 //       16    1  bits of a pixel: 8, 15, 16, 24 or 32
-//       17    1  descriptor: low four bits attribute (alpha) bits; 0x10 pixels run from the right, 0x20 rows from the top
-//       18       identification text, color map, pixels
-//   end-26   26  footer of version 2: offsets of the extension area and the developer area, "TRUEVISION-XFILE." and 0
+//       17    1  descriptor: low four bits attribute (alpha) bits; 0x10 pixels run from the right,
+//       0x20 rows from the top 18       identification text, color map, pixels
+//   end-26   26  footer of version 2: offsets of the extension area and the developer area,
+//   "TRUEVISION-XFILE." and 0
 //
-// Pixels of 15 and 16 bits are A RRRRR GGGGG BBBBB, of 24 and 32 bits blue, green, red (alpha); gray ones of 16 bits are
-// gray and alpha. A packet is a byte n and one pixel, repeated n - 127 times (n from 128), or n + 1 pixels as they stand.
+// Pixels of 15 and 16 bits are A RRRRR GGGGG BBBBB, of 24 and 32 bits blue, green, red (alpha);
+// gray ones of 16 bits are gray and alpha. A packet is a byte n and one pixel, repeated n - 127
+// times (n from 128), or n + 1 pixels as they stand.
 //
-// The reader takes packets that go on in the next row. Attribute bits count as alpha when the descriptor has them and the
-// extension area, where there is one, does not call them useless; an alpha plane without any opacity is taken for unset and
-// dropped, as many programs leave these bits zero.
+// The reader takes packets that go on in the next row. Attribute bits count as alpha when the
+// descriptor has them and the extension area, where there is one, does not call them useless; an
+// alpha plane without any opacity is taken for unset and dropped, as many programs leave these bits
+// zero.
 //
-// The writer stores uncompressed rows from the bottom up, which every reader takes, with a version 2 footer: up to 8 bits
-// as color-mapped (grays as gray), 24 bits, 32 with an alpha plane; 16 bits with CreateTarga16.
-// Source: Truevision, "TGA File Format Specification, Version 2.0" (1991).
+// The writer stores uncompressed rows from the bottom up, which every reader takes, with a version
+// 2 footer: up to 8 bits as color-mapped (grays as gray), 24 bits, 32 with an alpha plane; 16 bits
+// with CreateTarga16. Source: Truevision, "TGA File Format Specification, Version 2.0" (1991).
 #include "formats/targa/tga.h"
 
 #include <algorithm>
@@ -69,18 +70,23 @@ struct TgaHeader {
     const int32_t colorBits = type == kMapped ? mapBits : bits;
     return colorBits == 32 || colorBits == 16;
   }
-  bool Indexed() const { return (type == kMapped && !HasAttribute()) || (type == kGray && bits == 8); }
+  bool Indexed() const {
+    return (type == kMapped && !HasAttribute()) || (type == kGray && bits == 8);
+  }
 };
 
 bool DepthFits(const TgaHeader& header) {
-  const auto isColor = [](uint8_t bits) { return bits == 15 || bits == 16 || bits == 24 || bits == 32; };
-  if (header.type == kMapped) return header.mapType == 1 && header.bits == 8 && isColor(header.mapBits);
+  const auto isColor = [](uint8_t bits) {
+    return bits == 15 || bits == 16 || bits == 24 || bits == 32;
+  };
+  if (header.type == kMapped)
+    return header.mapType == 1 && header.bits == 8 && isColor(header.mapBits);
   if (header.type == kGray) return header.bits == 8 || header.bits == 16;
   return isColor(header.bits);
 }
 
-// Ok; FileReadError for a short header, NoImages for type 0, UnsupportedFormat for a type or depth that is not read,
-// DamagedFile for what no Targa file can say.
+// Ok; FileReadError for a short header, NoImages for type 0, UnsupportedFormat for a type or depth
+// that is not read, DamagedFile for what no Targa file can say.
 Status ParseHeader(std::span<const uint8_t> file, TgaHeader& header) {
   ByteReader bytes(file);
   header.idLength = bytes.U8();
@@ -116,13 +122,14 @@ Color ColorFrom(const uint8_t* bytes, int32_t bits) {
   if (bits >= 24) return {bytes[0], bytes[1], bytes[2], bits == 32 ? bytes[3] : uint8_t{255}};
   const uint32_t value = static_cast<uint32_t>(bytes[0] | bytes[1] << 8);
   const uint8_t alpha = bits == 16 && (value & 0x8000) == 0 ? 0 : 255;
-  return {FiveToEight(value & 31), FiveToEight(value >> 5 & 31), FiveToEight(value >> 10 & 31), alpha};
+  return {FiveToEight(value & 31), FiveToEight(value >> 5 & 31), FiveToEight(value >> 10 & 31),
+          alpha};
 }
 
 using ColorMap = std::array<Color, 256>;
 
-// The map's colors at their indices; entries beyond 255 and those that the file lacks do not count. FileReadError when
-// the map is cut short.
+// The map's colors at their indices; entries beyond 255 and those that the file lacks do not count.
+// FileReadError when the map is cut short.
 Status ReadColorMap(std::span<const uint8_t> file, const TgaHeader& header, ColorMap& map) {
   map.fill({0, 0, 0, 255});
   if (header.type != kMapped) return Status::Ok;
@@ -144,7 +151,8 @@ void DescribePicture(const TgaHeader& header, PictureRecord& picture) {
   picture.height = header.height;
   picture.bitsPerPixel = header.Indexed() ? 8 : 24;
   const bool alpha = header.HasAttribute();
-  picture.alphaFlags = static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (alpha ? kHasAlpha : 0));
+  picture.alphaFlags =
+      static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (alpha ? kHasAlpha : 0));
   picture.imageBytes = EstimateImageBytes(picture.width, picture.height, picture.bitsPerPixel);
 }
 
@@ -192,7 +200,8 @@ class RowSource {
       if (left_ == 0 && !BeginPacket()) return {};
       const uint64_t count = std::min(left_ * pixelSize_, row_.size() - filled);
       if (isRun_) {
-        for (uint64_t i = 0; i < count; i += pixelSize_) std::memcpy(&row_[filled + i], value_.data(), pixelSize_);
+        for (uint64_t i = 0; i < count; i += pixelSize_)
+          std::memcpy(&row_[filled + i], value_.data(), pixelSize_);
       } else {
         const auto pixels = bytes_.Take(count);
         if (pixels.empty()) return {};
@@ -223,10 +232,11 @@ class RowSource {
 };
 
 // What a row of the file becomes: indices, or colors and alpha (empty without a plane).
-using RowReader = void (*)(std::span<const uint8_t> source, int32_t width, const ColorMap& map, std::span<uint8_t> row,
-                           std::span<uint8_t> alpha);
+using RowReader = void (*)(std::span<const uint8_t> source, int32_t width, const ColorMap& map,
+                           std::span<uint8_t> row, std::span<uint8_t> alpha);
 
-void CopyRow(std::span<const uint8_t> source, int32_t, const ColorMap&, std::span<uint8_t> row, std::span<uint8_t>) {
+void CopyRow(std::span<const uint8_t> source, int32_t, const ColorMap&, std::span<uint8_t> row,
+             std::span<uint8_t>) {
   std::memcpy(row.data(), source.data(), source.size());
 }
 
@@ -243,18 +253,19 @@ void ReadColors(int32_t width, std::span<uint8_t> row, std::span<uint8_t> alpha,
 }
 
 template <int32_t bits>
-void ReadTrueColor(std::span<const uint8_t> source, int32_t width, const ColorMap&, std::span<uint8_t> row,
-                   std::span<uint8_t> alpha) {
-  ReadColors(width, row, alpha, [&](size_t x) { return ColorFrom(&source[x * ((bits + 7) / 8)], bits); });
+void ReadTrueColor(std::span<const uint8_t> source, int32_t width, const ColorMap&,
+                   std::span<uint8_t> row, std::span<uint8_t> alpha) {
+  ReadColors(width, row, alpha,
+             [&](size_t x) { return ColorFrom(&source[x * ((bits + 7) / 8)], bits); });
 }
 
-void ReadMapped(std::span<const uint8_t> source, int32_t width, const ColorMap& map, std::span<uint8_t> row,
-                std::span<uint8_t> alpha) {
+void ReadMapped(std::span<const uint8_t> source, int32_t width, const ColorMap& map,
+                std::span<uint8_t> row, std::span<uint8_t> alpha) {
   ReadColors(width, row, alpha, [&](size_t x) { return map[source[x]]; });
 }
 
-void ReadGrayAlpha(std::span<const uint8_t> source, int32_t width, const ColorMap&, std::span<uint8_t> row,
-                   std::span<uint8_t> alpha) {
+void ReadGrayAlpha(std::span<const uint8_t> source, int32_t width, const ColorMap&,
+                   std::span<uint8_t> row, std::span<uint8_t> alpha) {
   ReadColors(width, row, alpha, [&](size_t x) {
     const uint8_t gray = source[2 * x];
     return Color{gray, gray, gray, source[2 * x + 1]};
@@ -280,8 +291,9 @@ void MirrorRow(std::span<uint8_t> row, int32_t width, size_t pixelSize) {
   }
 }
 
-Status ReadRows(ByteReader& bytes, platform::FileView& file, const TgaHeader& header, const ColorMap& map,
-                const PictureRecord& picture, PackedImage& image, PackedImage& alpha) {
+Status ReadRows(ByteReader& bytes, platform::FileView& file, const TgaHeader& header,
+                const ColorMap& map, const PictureRecord& picture, PackedImage& image,
+                PackedImage& alpha) {
   const RowReader readRow = ChooseRowReader(header);
   const size_t pixelSize = image.Bits() == 8 ? 1 : 3;
   RowSource source(bytes, header);
@@ -345,19 +357,23 @@ void WriteHeader(ByteWriter& out, const PictureRecord& picture, const TgaLayout&
 }
 
 uint16_t SixteenBits(const uint8_t* color, bool opaque) {
-  return static_cast<uint16_t>(color[2] >> 3 << 10 | color[1] >> 3 << 5 | color[0] >> 3 | (opaque ? 0x8000 : 0));
+  return static_cast<uint16_t>(color[2] >> 3 << 10 | color[1] >> 3 << 5 | color[0] >> 3 |
+                               (opaque ? 0x8000 : 0));
 }
 
-void WriteRow(const PictureRecord& picture, int32_t r, const TgaLayout& layout, std::vector<uint8_t>& bytes) {
+void WriteRow(const PictureRecord& picture, int32_t r, const TgaLayout& layout,
+              std::vector<uint8_t>& bytes) {
   const auto row = picture.image.StoredRow(r);
   const auto width = static_cast<size_t>(picture.image.Width());
   const size_t bits = static_cast<size_t>(picture.image.Bits());
-  const auto alpha = picture.alpha.Empty() ? std::span<const uint8_t>() : picture.alpha.StoredRow(r);
+  const auto alpha =
+      picture.alpha.Empty() ? std::span<const uint8_t>() : picture.alpha.StoredRow(r);
   if (layout.bits == 8) {
     const size_t perByte = 8 / bits;
     const uint8_t mask = static_cast<uint8_t>((1u << bits) - 1);
     for (size_t x = 0; x < width; ++x) {
-      bytes[x] = static_cast<uint8_t>(row[x / perByte] >> (perByte - 1 - x % perByte) * bits & mask);
+      bytes[x] =
+          static_cast<uint8_t>(row[x / perByte] >> (perByte - 1 - x % perByte) * bits & mask);
     }
   } else if (layout.bits == 16) {
     for (size_t x = 0; x < width; ++x) {
@@ -376,7 +392,8 @@ void WriteRow(const PictureRecord& picture, int32_t r, const TgaLayout& layout, 
 }
 
 // What stands in front of the pixels, and the picture's facts from it.
-Status TakeHead(std::span<const uint8_t> file, TgaHeader& header, ColorMap& map, PictureRecord& picture) {
+Status TakeHead(std::span<const uint8_t> file, TgaHeader& header, ColorMap& map,
+                PictureRecord& picture) {
   RETURN_IF_BAD(ParseHeader(file, header));
   RETURN_IF_BAD(ReadColorMap(file, header, map));
   DescribePicture(header, picture);
@@ -408,8 +425,10 @@ Status TgaRead(PictureRecord& picture, const ReadRequest& request) {
 
   ByteReader bytes(file.Bytes());
   bytes.Seek(header.PixelOffset());
-  const uint64_t pixels = static_cast<uint64_t>(header.width) * static_cast<uint64_t>(header.height);
-  const uint64_t least = header.runLength ? pixels / 128 * (1 + header.PixelSize()) : pixels * header.PixelSize();
+  const uint64_t pixels =
+      static_cast<uint64_t>(header.width) * static_cast<uint64_t>(header.height);
+  const uint64_t least =
+      header.runLength ? pixels / 128 * (1 + header.PixelSize()) : pixels * header.PixelSize();
   if (!bytes.Ok() || bytes.Left() < least) return Status::FileReadError;
   PackedImage image, alpha;
   RETURN_IF_BAD(NewPackedImage(header.width, header.height, &picture.palette, picture.bitsPerPixel, image));
@@ -432,7 +451,8 @@ Status TgaWrite(PictureRecord& picture, const WriteOptions& options) {
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
   const TgaLayout layout = ChooseLayout(picture, options.encode.targa16);
   WriteHeader(out, picture, layout);
-  std::vector<uint8_t> row(static_cast<size_t>(image.Width()) * static_cast<size_t>(layout.bits / 8));
+  std::vector<uint8_t> row(static_cast<size_t>(image.Width()) *
+                           static_cast<size_t>(layout.bits / 8));
   for (int32_t r = 0; r < image.Height() && !out.Failed(); ++r) {
     RETURN_IF_BAD(picture.ReportRow(r));
     WriteRow(picture, r, layout, row);

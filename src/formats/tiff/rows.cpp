@@ -18,7 +18,8 @@ constexpr Signature kSignatures[] = {
     {0, "MM\0\x2b"sv, "TIFF"},
 };
 
-constexpr FormatSetting kKeys[] = {{"TiffOptions", TrLater("Compression")}, {"TiffResolution"}, {"JpegCompression"}};
+constexpr FormatSetting kKeys[] = {
+    {"TiffOptions", TrLater("Compression")}, {"TiffResolution"}, {"JpegCompression"}};
 constexpr FormatSettings kSettings = {"TIF", "OverrideTifBox", TrLater("TIFF"), kKeys};
 
 // The number in "LIBTIFF, Version 4.5.0" and a copyright line.

@@ -6,9 +6,10 @@
 
 namespace fotomill {
 
-// TIFF and BigTIFF. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when the file ends before its pixels,
-// MemoryAllocationError (6), UnsupportedFormat (8) for samples or compressions that are not decoded, NoImages (20) for a
-// page that is not there. Reads the request's page.
+// TIFF and BigTIFF. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when the file
+// ends before its pixels, MemoryAllocationError (6), UnsupportedFormat (8) for samples or
+// compressions that are not decoded, NoImages (20) for a page that is not there. Reads the
+// request's page.
 Status TiffInfo(PictureRecord& picture, const ReadRequest& request);
 Status TiffRead(PictureRecord& picture, const ReadRequest& request);
 // Also ErrorCreatingFile (10), ErrorWritingFile (11).

@@ -17,14 +17,16 @@ TiffMessages& MessagesOf(void* user) { return *static_cast<TiffMessages*>(user);
 // Both return 1: the message has been dealt with, nobody else is to print it.
 int OnError(TIFF*, void* user, const char*, const char* format, va_list arguments) {
   TiffMessages& messages = MessagesOf(user);
-  if (messages.error[0] == 0) std::vsnprintf(messages.error, sizeof messages.error, format, arguments);
+  if (messages.error[0] == 0)
+    std::vsnprintf(messages.error, sizeof messages.error, format, arguments);
   return 1;
 }
 
 // What the library finds odd in directories harms nobody; and old LZW codes are no fault.
 int OnWarning(TIFF*, void* user, const char* module, const char* format, va_list arguments) {
   TiffMessages& messages = MessagesOf(user);
-  const bool counts = messages.inPixels && messages.warning[0] == 0 && !std::string_view(module).starts_with("LZW");
+  const bool counts =
+      messages.inPixels && messages.warning[0] == 0 && !std::string_view(module).starts_with("LZW");
   if (counts) std::vsnprintf(messages.warning, sizeof messages.warning, format, arguments);
   return 1;
 }
@@ -47,7 +49,8 @@ Options NewOptions(TiffMessages& messages) {
   }();
   Options options(silenced ? TIFFOpenOptionsAlloc() : nullptr);
   if (options == nullptr) return options;
-  TIFFOpenOptionsSetMaxSingleMemAlloc(options.get(), static_cast<tmsize_t>(limits.packedBlockBytes));
+  TIFFOpenOptionsSetMaxSingleMemAlloc(options.get(),
+                                      static_cast<tmsize_t>(limits.packedBlockBytes));
   TIFFOpenOptionsSetErrorHandlerExtR(options.get(), OnError, &messages);
   TIFFOpenOptionsSetWarningHandlerExtR(options.get(), OnWarning, &messages);
   return options;
@@ -56,9 +59,13 @@ Options NewOptions(TiffMessages& messages) {
 TiffInput& InputOf(thandle_t handle) { return *static_cast<TiffInput*>(handle); }
 TiffOutput& OutputOf(thandle_t handle) { return *static_cast<TiffOutput*>(handle); }
 
-tmsize_t ReadInput(thandle_t handle, void* target, tmsize_t count) { return InputOf(handle).Read(target, count); }
+tmsize_t ReadInput(thandle_t handle, void* target, tmsize_t count) {
+  return InputOf(handle).Read(target, count);
+}
 tmsize_t WriteNothing(thandle_t, void*, tmsize_t) { return -1; }
-uint64_t SeekInput(thandle_t handle, uint64_t offset, int from) { return InputOf(handle).Seek(offset, from); }
+uint64_t SeekInput(thandle_t handle, uint64_t offset, int from) {
+  return InputOf(handle).Seek(offset, from);
+}
 uint64_t InputSize(thandle_t handle) { return InputOf(handle).Bytes().size(); }
 int MapInput(thandle_t handle, void** base, toff_t* size) {
   *base = const_cast<uint8_t*>(InputOf(handle).Bytes().data());  // the library only reads it
@@ -66,8 +73,12 @@ int MapInput(thandle_t handle, void** base, toff_t* size) {
   return 1;
 }
 tmsize_t ReadNothing(thandle_t, void*, tmsize_t) { return -1; }
-tmsize_t WriteOutput(thandle_t handle, void* source, tmsize_t count) { return OutputOf(handle).Write(source, count); }
-uint64_t SeekOutput(thandle_t handle, uint64_t offset, int from) { return OutputOf(handle).Seek(offset, from); }
+tmsize_t WriteOutput(thandle_t handle, void* source, tmsize_t count) {
+  return OutputOf(handle).Write(source, count);
+}
+uint64_t SeekOutput(thandle_t handle, uint64_t offset, int from) {
+  return OutputOf(handle).Seek(offset, from);
+}
 uint64_t OutputSize(thandle_t handle) { return OutputOf(handle).Seek(0, SEEK_END); }
 int CloseNothing(thandle_t) { return 0; }
 int MapNothing(thandle_t, void**, toff_t*) { return 0; }
@@ -83,8 +94,8 @@ Status TiffInput::Open() {
   if (bytes_.size() < 8) return Status::FileReadError;
   const Options options = NewOptions(messages_);
   if (options == nullptr) return Status::MemoryAllocationError;
-  tiff_ = TIFFClientOpenExt("", "r", this, ReadInput, WriteNothing, SeekInput, CloseNothing, InputSize, MapInput, UnmapNothing,
-                            options.get());
+  tiff_ = TIFFClientOpenExt("", "r", this, ReadInput, WriteNothing, SeekInput, CloseNothing,
+                            InputSize, MapInput, UnmapNothing, options.get());
   return tiff_ != nullptr ? Status::Ok : Failure();
 }
 
@@ -96,8 +107,8 @@ Status TiffInput::OpenAt(uint64_t directory) {
   return Open();
 }
 
-// Puts the directory's offset into what was read of the header from `offset` on: behind the 4 bytes of signature and
-// version, in BigTIFF behind 8.
+// Puts the directory's offset into what was read of the header from `offset` on: behind the 4 bytes
+// of signature and version, in BigTIFF behind 8.
 void TiffInput::NameDirectory(uint64_t offset, std::span<uint8_t> bytes) const {
   const bool bigEndian = bytes_[0] == 'M', big = (bigEndian ? bytes_[3] : bytes_[2]) == 43;
   const uint64_t field = big ? 8 : 4, size = field;
@@ -110,19 +121,23 @@ void TiffInput::NameDirectory(uint64_t offset, std::span<uint8_t> bytes) const {
 
 Status TiffInput::Failure() const {
   const std::string_view message(messages_.error);
-  const auto says = [&](std::string_view words) { return message.find(words) != std::string_view::npos; };
-  if (says("ot configured") || says("not supported") || says("nsupported") || says("not implemented") || says("can not handle") ||
-      says("Sorry")) {
+  const auto says = [&](std::string_view words) {
+    return message.find(words) != std::string_view::npos;
+  };
+  if (says("ot configured") || says("not supported") || says("nsupported") ||
+      says("not implemented") || says("can not handle") || says("Sorry")) {
     return Status::UnsupportedFormat;
   }
   if (says("emory") || says("No space")) return Status::MemoryAllocationError;
-  if (says("ead error") || says("an not read TIFF") || says("eek error") || says("ot enough data")) return Status::FileReadError;
+  if (says("ead error") || says("an not read TIFF") || says("eek error") || says("ot enough data"))
+    return Status::FileReadError;
   return Status::DamagedFile;
 }
 
 tmsize_t TiffInput::Read(void* target, tmsize_t count) {
   if (count <= 0 || position_ >= bytes_.size()) return 0;
-  const size_t taken = std::min(static_cast<size_t>(count), static_cast<size_t>(bytes_.size() - position_));
+  const size_t taken =
+      std::min(static_cast<size_t>(count), static_cast<size_t>(bytes_.size() - position_));
   std::memcpy(target, bytes_.data() + position_, taken);
   if (directory_ != 0) NameDirectory(position_, {static_cast<uint8_t*>(target), taken});
   position_ += taken;
@@ -141,8 +156,8 @@ TiffOutput::~TiffOutput() {
 bool TiffOutput::Open() {
   const Options options = NewOptions(messages_);
   if (options == nullptr) return false;
-  tiff_ = TIFFClientOpenExt("", "wl", this, ReadNothing, WriteOutput, SeekOutput, CloseNothing, OutputSize, MapNothing,
-                            UnmapNothing, options.get());
+  tiff_ = TIFFClientOpenExt("", "wl", this, ReadNothing, WriteOutput, SeekOutput, CloseNothing,
+                            OutputSize, MapNothing, UnmapNothing, options.get());
   return tiff_ != nullptr;
 }
 

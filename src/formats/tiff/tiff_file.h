@@ -25,10 +25,11 @@ class TiffInput {
   TiffInput(const TiffInput&) = delete;
   TiffInput& operator=(const TiffInput&) = delete;
 
-  // Ok; FileReadError (3) when the file ends too early, DamagedFile (2) when it is none or its directory makes no sense.
+  // Ok; FileReadError (3) when the file ends too early, DamagedFile (2) when it is none or its
+  // directory makes no sense.
   Status Open();
-  // Opens the file again at another directory, as if its header named that one: the library would otherwise follow the whole
-  // chain for each page. Statuses of Open.
+  // Opens the file again at another directory, as if its header named that one: the library would
+  // otherwise follow the whole chain for each page. Statuses of Open.
   Status OpenAt(uint64_t directory);
   // What a failed call of the library means, by its message.
   Status Failure() const;

@@ -1,4 +1,5 @@
-// Source: Adobe, "TIFF Revision 6.0", 1992, section 23; Technical Note "ICC L*a*b*"; ICC.1:2022, 6.3.4.2 (encoding of 8 bits).
+// Source: Adobe, "TIFF Revision 6.0", 1992, section 23; Technical Note "ICC L*a*b*";
+// ICC.1:2022, 6.3.4.2 (encoding of 8 bits).
 #include "formats/tiff/tiff_lab.h"
 
 #include <lcms2.h>
@@ -11,7 +12,9 @@ TiffLab::TiffLab(bool signedColors) : flip_(signedColors ? 0x80 : 0) {
   const cmsHPROFILE lab = cmsCreateLab4Profile(nullptr), screen = cmsCreate_sRGBProfile();
   constexpr cmsUInt32Number kLab8 = COLORSPACE_SH(PT_Lab) | CHANNELS_SH(3) | BYTES_SH(1);
   const bool opened = lab != nullptr && screen != nullptr;
-  transform_ = opened ? cmsCreateTransform(lab, kLab8, screen, TYPE_BGR_8, INTENT_RELATIVE_COLORIMETRIC, cmsFLAGS_NOCACHE) : nullptr;
+  transform_ = opened ? cmsCreateTransform(lab, kLab8, screen, TYPE_BGR_8,
+                                           INTENT_RELATIVE_COLORIMETRIC, cmsFLAGS_NOCACHE)
+                      : nullptr;
   if (lab != nullptr) cmsCloseProfile(lab);
   if (screen != nullptr) cmsCloseProfile(screen);
 }

@@ -15,7 +15,8 @@ class TiffLab {
   TiffLab(const TiffLab&) = delete;
   TiffLab& operator=(const TiffLab&) = delete;
 
-  // A row of `width` pixels, `step` samples each, to blue, green, red; gray by L* alone when there is no memory.
+  // A row of `width` pixels, `step` samples each, to blue, green, red; gray by L* alone when there
+  // is no memory.
   void StoreRow(const uint8_t* samples, size_t step, size_t width, uint8_t* image);
 
  private:

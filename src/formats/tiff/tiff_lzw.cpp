@@ -20,9 +20,11 @@ uint64_t LoadBe64(const uint8_t* bytes) {
 // Codes from the most significant bit down; past the end there are zeros, and Ok() turns false.
 class CodeReader {
  public:
-  explicit CodeReader(std::span<const uint8_t> source) : next_(source.data()), end_(source.data() + source.size()) {}
+  explicit CodeReader(std::span<const uint8_t> source)
+      : next_(source.data()), end_(source.data() + source.size()) {}
   uint32_t Take(unsigned width) {
-    if (end_ - next_ >= 8) {  // every time and without a look at what is there: cheaper than a branch that often goes wrong
+    // every time and without a look at what is there: cheaper than a branch that often goes wrong
+    if (end_ - next_ >= 8) {
       bits_ |= LoadBe64(next_) >> count_;
       next_ += (63 - count_) / 8;
       count_ |= 56;
@@ -37,7 +39,8 @@ class CodeReader {
   bool Ok() const { return !overrun_; }
 
  private:
-  // Near the end, byte by byte. Bits behind the first `count_` are those of the bytes that follow, or zeros.
+  // Near the end, byte by byte. Bits behind the first `count_` are those of the bytes that follow,
+  // or zeros.
   void Refill(unsigned width) {
     bits_ &= count_ == 0 ? 0 : ~uint64_t{0} << (64 - count_);
     while (count_ < width) {
@@ -80,7 +83,8 @@ class CodeWriter {
   unsigned count_ = 0;
 };
 
-// Copies by pieces of 16, the last of which may go beyond the string, unless source and target are too near for that.
+// Copies by pieces of 16, the last of which may go beyond the string, unless source and target are
+// too near for that.
 void CopyString(const uint8_t* from, uint64_t length, uint64_t distance, uint8_t* to) {
   constexpr uint64_t kPiece = 16;
   if (distance < kPiece) {
@@ -98,7 +102,8 @@ void CopyString(const uint8_t* from, uint64_t length, uint64_t distance, uint8_t
 
 uint8_t* TiffLzwDecoder::Decode(std::span<const uint8_t> source, size_t size) {
   if (size > UINT32_MAX - kLiterals) return nullptr;
-  if (source.size() >= 2 && source[0] == 0 && (source[1] & 1) != 0) return nullptr;  // the old kind begins so
+  // the old kind begins so
+  if (source.size() >= 2 && source[0] == 0 && (source[1] & 1) != 0) return nullptr;
   output_.resize(kLiterals + size + kSlack);
   uint8_t* const bytes = output_.data();
   for (uint32_t i = 0; i < kLiterals; ++i) {
@@ -121,7 +126,8 @@ uint8_t* TiffLzwDecoder::Decode(std::span<const uint8_t> source, size_t size) {
       if (!codes.Ok()) return nullptr;
       continue;
     }
-    if (code == kEnd || code > next || (code == next && last.length == 0) || !codes.Ok()) return nullptr;
+    if (code == kEnd || code > next || (code == next && last.length == 0) || !codes.Ok())
+      return nullptr;
     if (last.length > 0) {
       if (next >= kMostCodes) return nullptr;
       entries_[next++] = {last.place, last.length + 1};  // its last byte is the one that comes now

@@ -7,19 +7,20 @@
 
 namespace fotomill {
 
-// The LZW of TIFF: codes of 9 to 12 bits, most significant bit first, each width left one code early; 256 clears the
-// table, 257 ends. Source: Adobe, "TIFF Revision 6.0", section 13.
+// The LZW of TIFF: codes of 9 to 12 bits, most significant bit first, each width left one code
+// early; 256 clears the table, 257 ends. Source: Adobe, "TIFF Revision 6.0", section 13.
 
 // Decodes strips or tiles, one after the other.
 class TiffLzwDecoder {
  public:
-  // Decodes exactly `size` bytes, which live until the next call and may be changed. Null when the data end before,
-  // name a code that cannot be, or are of the old kind with its bits the other way round.
+  // Decodes exactly `size` bytes, which live until the next call and may be changed. Null when the
+  // data end before, name a code that cannot be, or are of the old kind with its bits the other way
+  // round.
   uint8_t* Decode(std::span<const uint8_t> source, size_t size);
 
  private:
-  // A string is where it came up first: in the output, or in the bytes in front of it, of which there is one of each
-  // value.
+  // A string is where it came up first: in the output, or in the bytes in front of it, of which
+  // there is one of each value.
   struct Entry {
     uint32_t place, length;
   };

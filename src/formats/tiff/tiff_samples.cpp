@@ -36,7 +36,8 @@ uint32_t LoadBits(const uint8_t* source, size_t index, uint32_t bits) {
   const uint64_t first = uint64_t{index} * bits;
   uint64_t value = 0;
   uint32_t taken = 0;
-  for (uint64_t byte = first / 8; taken < bits + first % 8; ++byte, taken += 8) value = value << 8 | source[byte];
+  for (uint64_t byte = first / 8; taken < bits + first % 8; ++byte, taken += 8)
+    value = value << 8 | source[byte];
   return static_cast<uint32_t>(value >> (taken - first % 8 - bits) & ((uint64_t{1} << bits) - 1));
 }
 
@@ -47,7 +48,8 @@ uint32_t LoadInteger(const uint8_t* source, size_t index, uint32_t bits) {
   if (bits == 24) {
     const uint8_t* bytes = source + 3 * index;
     const bool little = std::endian::native == std::endian::little;
-    return static_cast<uint32_t>(bytes[little ? 2 : 0] << 16 | bytes[1] << 8 | bytes[little ? 0 : 2]);
+    return static_cast<uint32_t>(bytes[little ? 2 : 0] << 16 | bytes[1] << 8 |
+                                 bytes[little ? 0 : 2]);
   }
   return LoadBits(source, index, bits);
 }
@@ -60,11 +62,13 @@ double LoadReal(const uint8_t* source, size_t index, uint32_t bits) {
 }  // namespace
 
 bool CanConvert(const TiffSampleForm& form) {
-  if (form.kind == TiffSampleForm::Float) return form.bits == 16 || form.bits == 32 || form.bits == 64;
+  if (form.kind == TiffSampleForm::Float)
+    return form.bits == 16 || form.bits == 32 || form.bits == 64;
   return form.bits >= 1 && form.bits <= 32;
 }
 
-void ConvertSamples(const uint8_t* source, const TiffSampleForm& form, bool scaled, size_t count, uint8_t* target, size_t step) {
+void ConvertSamples(const uint8_t* source, const TiffSampleForm& form, bool scaled, size_t count,
+                    uint8_t* target, size_t step) {
   if (form.kind == TiffSampleForm::Float) {
     for (size_t i = 0; i < count; ++i) target[i * step] = FromReal(LoadReal(source, i, form.bits));
     return;
@@ -75,16 +79,20 @@ void ConvertSamples(const uint8_t* source, const TiffSampleForm& form, bool scal
   }
   if (form.bits == 16 && form.kind == TiffSampleForm::Unsigned) {
     for (size_t i = 0; i < count; ++i) {
-      target[i * step] = static_cast<uint8_t>((Load<uint16_t>(source + 2 * i) * 255u + 32895) >> 16);
+      target[i * step] =
+          static_cast<uint8_t>((Load<uint16_t>(source + 2 * i) * 255u + 32895) >> 16);
     }
     return;
   }
   const uint64_t most = (uint64_t{1} << form.bits) - 1;
-  // Signed samples are moved to where the lowest is black. Bytes are not: what writes them means values from 0 to 255.
-  const auto sign = static_cast<uint32_t>(form.kind == TiffSampleForm::Signed && form.bits != 8 ? uint64_t{1} << (form.bits - 1) : 0);
+  // Signed samples are moved to where the lowest is black. Bytes are not: what writes them means
+  // values from 0 to 255.
+  const auto sign = static_cast<uint32_t>(
+      form.kind == TiffSampleForm::Signed && form.bits != 8 ? uint64_t{1} << (form.bits - 1) : 0);
   for (size_t i = 0; i < count; ++i) {
     const uint32_t value = LoadInteger(source, i, form.bits) ^ sign;
-    target[i * step] = static_cast<uint8_t>(scaled ? (uint64_t{value} * 255 + most / 2) / most : value);
+    target[i * step] =
+        static_cast<uint8_t>(scaled ? (uint64_t{value} * 255 + most / 2) / most : value);
   }
 }
 

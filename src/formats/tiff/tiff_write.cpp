@@ -1,7 +1,9 @@
-// The TIFF writer: one page, little-endian, in strips compressed as TiffOptions says. Palettes of 1, 4 and 8 bits keep their
-// depth (grays as gray), colors are RGB, with an alpha plane as a separate extra sample. CCITT group 4 takes black and
-// white pictures, JPEG grays of 8 bits and colors without alpha; LZW takes the rest. Resolution is the picture's, else
-// TiffResolution. An EXIF block is spread over the file's directories; a thumbnail in it stays behind, as it would be a page.
+// The TIFF writer: one page, little-endian, in strips compressed as TiffOptions says. Palettes of
+// 1, 4 and 8 bits keep their depth (grays as gray), colors are RGB, with an alpha plane as a
+// separate extra sample. CCITT group 4 takes black and white pictures, JPEG grays of 8 bits and
+// colors without alpha; LZW takes the rest. Resolution is the picture's, else TiffResolution. An
+// EXIF block is spread over the file's directories; a thumbnail in it stays behind, as it would be
+// a page.
 #include <algorithm>
 #include <span>
 #include <string>
@@ -48,11 +50,13 @@ uint16_t CompressionFor(const TiffPlan& plan, Grays grays, int32_t choice) {
   switch (std::clamp<int32_t>(choice, choice::kTiffNone, choice::kTiffJpeg)) {
     case choice::kTiffNone: return COMPRESSION_NONE;
     case choice::kTiffPackBits: return COMPRESSION_PACKBITS;
-    case choice::kTiffCcitt: return plan.bits == 1 && grays != Grays::No ? COMPRESSION_CCITTFAX4 : COMPRESSION_LZW;
+    case choice::kTiffCcitt:
+      return plan.bits == 1 && grays != Grays::No ? COMPRESSION_CCITTFAX4 : COMPRESSION_LZW;
     case choice::kTiffDeflate: return COMPRESSION_ADOBE_DEFLATE;
     case choice::kTiffJpeg:
-      return plan.bits == 8 && (plan.samples == 3 || (plan.samples == 1 && grays == Grays::Rising)) ? COMPRESSION_JPEG
-                                                                                                    : COMPRESSION_LZW;
+      return plan.bits == 8 && (plan.samples == 3 || (plan.samples == 1 && grays == Grays::Rising))
+                 ? COMPRESSION_JPEG
+                 : COMPRESSION_LZW;
     default: return COMPRESSION_LZW;
   }
 }
@@ -74,8 +78,9 @@ TiffPlan MakePlan(const PictureRecord& picture, int32_t compression) {
     plan.photometric = PHOTOMETRIC_MINISWHITE;
   }
   if (plan.compression == COMPRESSION_JPEG && color) plan.photometric = PHOTOMETRIC_YCBCR;
-  plan.predict = (plan.compression == COMPRESSION_LZW || plan.compression == COMPRESSION_ADOBE_DEFLATE) && plan.bits == 8 &&
-                 plan.photometric != PHOTOMETRIC_PALETTE;
+  plan.predict =
+      (plan.compression == COMPRESSION_LZW || plan.compression == COMPRESSION_ADOBE_DEFLATE) &&
+      plan.bits == 8 && plan.photometric != PHOTOMETRIC_PALETTE;
   return plan;
 }
 
@@ -89,7 +94,8 @@ void SetColors(TIFF* tiff, const PictureRecord& picture) {
   TIFFSetField(tiff, TIFFTAG_COLORMAP, channels[0].data(), channels[1].data(), channels[2].data());
 }
 
-void SetLayout(TIFF* tiff, const PictureRecord& picture, const TiffPlan& plan, int32_t jpegQuality) {
+void SetLayout(TIFF* tiff, const PictureRecord& picture, const TiffPlan& plan,
+               int32_t jpegQuality) {
   const PackedImage& image = picture.image;
   TIFFSetField(tiff, TIFFTAG_IMAGEWIDTH, static_cast<uint32_t>(image.Width()));
   TIFFSetField(tiff, TIFFTAG_IMAGELENGTH, static_cast<uint32_t>(image.Height()));
@@ -106,17 +112,22 @@ void SetLayout(TIFF* tiff, const PictureRecord& picture, const TiffPlan& plan, i
   }
   if (plan.compression == COMPRESSION_JPEG) {
     TIFFSetField(tiff, TIFFTAG_JPEGQUALITY, std::clamp<int>(jpegQuality, 1, 100));
-    if (plan.photometric == PHOTOMETRIC_YCBCR) TIFFSetField(tiff, TIFFTAG_JPEGCOLORMODE, JPEGCOLORMODE_RGB);
+    if (plan.photometric == PHOTOMETRIC_YCBCR)
+      TIFFSetField(tiff, TIFFTAG_JPEGCOLORMODE, JPEGCOLORMODE_RGB);
   }
-  const uint64_t rowBytes = (static_cast<uint64_t>(image.Width()) * plan.bits * plan.samples + 7) / 8;
+  const uint64_t rowBytes =
+      (static_cast<uint64_t>(image.Width()) * plan.bits * plan.samples + 7) / 8;
   uint64_t rows = std::max<uint64_t>(kStripBytes / rowBytes, 1);
-  if (plan.compression == COMPRESSION_JPEG) rows = (rows + kJpegBlock - 1) / kJpegBlock * kJpegBlock;
+  if (plan.compression == COMPRESSION_JPEG)
+    rows = (rows + kJpegBlock - 1) / kJpegBlock * kJpegBlock;
   if (plan.compression == COMPRESSION_CCITTFAX4) rows = static_cast<uint64_t>(image.Height());
-  TIFFSetField(tiff, TIFFTAG_ROWSPERSTRIP,
-               static_cast<uint32_t>(std::min<uint64_t>(rows, static_cast<uint64_t>(image.Height()))));
+  TIFFSetField(
+      tiff, TIFFTAG_ROWSPERSTRIP,
+      static_cast<uint32_t>(std::min<uint64_t>(rows, static_cast<uint64_t>(image.Height()))));
 }
 
-// Tags of titles and ratings that the library does not know. Source: Microsoft, "Photo Metadata Policies".
+// Tags of titles and ratings that the library does not know. Source: Microsoft, "Photo Metadata
+// Policies".
 constexpr TIFFFieldInfo kTitles[] = {
     {0x4746, 1, 1, TIFF_SHORT, FIELD_CUSTOM, 1, 0, const_cast<char*>("Rating")},
     {0x4749, 1, 1, TIFF_SHORT, FIELD_CUSTOM, 1, 0, const_cast<char*>("RatingPercent")},
@@ -131,15 +142,18 @@ constexpr TIFFFieldInfo kTitles[] = {
 void SetDescription(TIFF* tiff, const ExifDirectories& directories) {
   TIFFMergeFieldInfo(tiff, kTitles, static_cast<uint32_t>(std::size(kTitles)));
   for (const ExifEntry& entry : directories.first) {
-    const bool title = std::any_of(std::begin(kTitles), std::end(kTitles), [&](const TIFFFieldInfo& info) {
-      return info.field_tag == entry.tag && info.field_type == entry.type;
-    });
+    const bool title =
+        std::any_of(std::begin(kTitles), std::end(kTitles), [&](const TIFFFieldInfo& info) {
+          return info.field_tag == entry.tag && info.field_type == entry.type;
+        });
     if (entry.type == TIFF_ASCII) {
-      const std::string text(entry.value.begin(), std::find(entry.value.begin(), entry.value.end(), uint8_t{0}));
+      const std::string text(entry.value.begin(),
+                             std::find(entry.value.begin(), entry.value.end(), uint8_t{0}));
       TIFFSetField(tiff, entry.tag, text.c_str());
     } else if (title && entry.type == TIFF_SHORT && entry.value.size() >= 2) {
       const uint8_t* value = entry.value.data();
-      TIFFSetField(tiff, entry.tag, directories.bigEndian ? value[0] << 8 | value[1] : value[1] << 8 | value[0]);
+      TIFFSetField(tiff, entry.tag,
+                   directories.bigEndian ? value[0] << 8 | value[1] : value[1] << 8 | value[0]);
     } else if (title && entry.type == TIFF_BYTE) {
       TIFFSetField(tiff, entry.tag, entry.count, entry.value.data());
     }
@@ -151,8 +165,10 @@ void SetDescription(TIFF* tiff, const ExifDirectories& directories) {
 void WriteExif(TiffOutput& output, const ExifDirectories& directories) {
   const PlacedExif placed = PlaceExif(directories, static_cast<uint32_t>(output.End()));
   output.Append(placed.bytes);
-  if (placed.exifOffset != 0) TIFFSetField(output.Handle(), TIFFTAG_EXIFIFD, uint64_t{placed.exifOffset});
-  if (placed.gpsOffset != 0) TIFFSetField(output.Handle(), TIFFTAG_GPSIFD, uint64_t{placed.gpsOffset});
+  if (placed.exifOffset != 0)
+    TIFFSetField(output.Handle(), TIFFTAG_EXIFIFD, uint64_t{placed.exifOffset});
+  if (placed.gpsOffset != 0)
+    TIFFSetField(output.Handle(), TIFFTAG_GPSIFD, uint64_t{placed.gpsOffset});
 }
 
 void SetMetadata(TiffOutput& output, PictureRecord& picture, const WriteOptions& options) {
@@ -160,9 +176,12 @@ void SetMetadata(TiffOutput& output, PictureRecord& picture, const WriteOptions&
   TIFF* tiff = output.Handle();
   const PictureMetadata& metadata = picture.metadata;
   TIFFSetField(tiff, TIFFTAG_RESOLUTIONUNIT, RESUNIT_INCH);
-  TIFFSetField(tiff, TIFFTAG_XRESOLUTION, metadata.dpiX > 0 ? metadata.dpiX : options.encode.resolution);
-  TIFFSetField(tiff, TIFFTAG_YRESOLUTION, metadata.dpiY > 0 ? metadata.dpiY : options.encode.resolution);
-  if (!keep || picture.metadata.exif.empty()) TIFFSetField(tiff, TIFFTAG_SOFTWARE, std::string(kCreator).c_str());
+  TIFFSetField(tiff, TIFFTAG_XRESOLUTION,
+               metadata.dpiX > 0 ? metadata.dpiX : options.encode.resolution);
+  TIFFSetField(tiff, TIFFTAG_YRESOLUTION,
+               metadata.dpiY > 0 ? metadata.dpiY : options.encode.resolution);
+  if (!keep || picture.metadata.exif.empty())
+    TIFFSetField(tiff, TIFFTAG_SOFTWARE, std::string(kCreator).c_str());
   if (!keep) return;
   const ExifDirectories exif = ParseExifBlock(metadata.exif);
   if (exif.Empty() && !metadata.exif.empty()) picture.lostMetadata |= kLostExif;
@@ -180,7 +199,8 @@ void SetMetadata(TiffOutput& output, PictureRecord& picture, const WriteOptions&
 }
 
 // A row as the file holds it. The library's predictor and byte orders work inside the buffer.
-void MakeRow(const PictureRecord& picture, const TiffPlan& plan, int32_t y, std::vector<uint8_t>& row) {
+void MakeRow(const PictureRecord& picture, const TiffPlan& plan, int32_t y,
+             std::vector<uint8_t>& row) {
   const uint8_t* source = picture.image.Row(y).data();
   if (picture.image.Bits() != 24) {
     const uint8_t flip = plan.invert ? 0xFF : 0;
@@ -201,18 +221,21 @@ void MakeRow(const PictureRecord& picture, const TiffPlan& plan, int32_t y, std:
   }
 }
 
-Status WriteScanlines(TIFF* tiff, const PictureRecord& picture, const TiffPlan& plan, size_t rowBytes) {
+Status WriteScanlines(TIFF* tiff, const PictureRecord& picture, const TiffPlan& plan,
+                      size_t rowBytes) {
   std::vector<uint8_t> row(rowBytes);
   for (int32_t y = 0; y < picture.image.Height(); ++y) {
     MakeRow(picture, plan, y, row);
-    if (TIFFWriteScanline(tiff, row.data(), static_cast<uint32_t>(y), 0) < 0) return Status::ErrorWritingFile;
+    if (TIFFWriteScanline(tiff, row.data(), static_cast<uint32_t>(y), 0) < 0)
+      return Status::ErrorWritingFile;
     RETURN_IF_BAD(picture.ReportRow(y));
   }
   return Status::Ok;
 }
 
 // LZW strips of our own coder, which takes two thirds of the library's time.
-Status WriteLzwStrips(TIFF* tiff, const PictureRecord& picture, const TiffPlan& plan, size_t rowBytes) {
+Status WriteLzwStrips(TIFF* tiff, const PictureRecord& picture, const TiffPlan& plan,
+                      size_t rowBytes) {
   uint32_t rowsPerStrip = 0;
   TIFFGetField(tiff, TIFFTAG_ROWSPERSTRIP, &rowsPerStrip);
   const auto height = static_cast<uint32_t>(picture.image.Height());
@@ -225,11 +248,13 @@ Status WriteLzwStrips(TIFF* tiff, const PictureRecord& picture, const TiffPlan& 
       uint8_t* target = strip.data() + r * rowBytes;
       const size_t plain = plan.predict ? plan.samples : rowBytes;
       std::copy_n(row.begin(), plain, target);
-      for (size_t i = plain; i < rowBytes; ++i) target[i] = static_cast<uint8_t>(row[i] - row[i - plain]);
+      for (size_t i = plain; i < rowBytes; ++i)
+        target[i] = static_cast<uint8_t>(row[i] - row[i - plain]);
       RETURN_IF_BAD(picture.ReportRow(static_cast<int32_t>(top + r)));
     }
     encoder.Encode(std::span(strip).first(rows * rowBytes), coded);
-    if (TIFFWriteRawStrip(tiff, index, coded.data(), static_cast<tmsize_t>(coded.size())) < 0) return Status::ErrorWritingFile;
+    if (TIFFWriteRawStrip(tiff, index, coded.data(), static_cast<tmsize_t>(coded.size())) < 0)
+      return Status::ErrorWritingFile;
   }
   return Status::Ok;
 }
@@ -241,7 +266,8 @@ Status WriteAll(ByteWriter& out, PictureRecord& picture, const WriteOptions& opt
   const TiffPlan plan = MakePlan(picture, options.encode.tiffCompression);
   SetLayout(tiff, picture, plan, options.encode.jpegQuality);
   SetMetadata(output, picture, options);
-  const size_t rowBytes = (static_cast<size_t>(picture.image.Width()) * plan.bits * plan.samples + 7) / 8;
+  const size_t rowBytes =
+      (static_cast<size_t>(picture.image.Width()) * plan.bits * plan.samples + 7) / 8;
   const bool lzw = plan.compression == COMPRESSION_LZW;
   RETURN_IF_BAD((lzw ? WriteLzwStrips : WriteScanlines)(tiff, picture, plan, rowBytes));
   return TIFFWriteDirectory(tiff) != 0 ? Status::Ok : Status::ErrorWritingFile;

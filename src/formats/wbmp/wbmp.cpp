@@ -2,8 +2,8 @@
 //
 //   type, 0: uncompressed; a number as below
 //   fixed header, 1 byte: bit 7 says that further header bytes follow, which type 0 does not have
-//   width, height: numbers of 7 bits a byte, the highest first; bit 7 says that another byte follows
-//   rows from the top, (width + 7) / 8 bytes each; a set bit is white
+//   width, height: numbers of 7 bits a byte, the highest first; bit 7 says that another byte
+//   follows rows from the top, (width + 7) / 8 bytes each; a set bit is white
 //
 // The reader ignores what follows the rows. The writer stores the darker of two colors as black.
 // Source: WAP Forum, "Wireless Application Environment Specification", WAP-237-WAEMT (2001).
@@ -94,7 +94,9 @@ Status WbmpRead(PictureRecord& picture, const ReadRequest& request) {
   WbmpHeader header;
   RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
   DescribePicture(header, picture);
-  if (file.FileSize() - header.pixelOffset < header.RowSize() * static_cast<uint64_t>(header.height)) return Status::FileReadError;
+  if (file.FileSize() - header.pixelOffset <
+      header.RowSize() * static_cast<uint64_t>(header.height))
+    return Status::FileReadError;
   PackedImage image;
   RETURN_IF_BAD(NewPackedImage(header.width, header.height, &picture.palette, 1, image));
   ByteReader bytes(file.Bytes());

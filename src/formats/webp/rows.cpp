@@ -22,7 +22,8 @@ constexpr FormatSettings kSettings = {"WEBP", "OverrideWebPBox", TrLater("WebP")
 
 std::string WebpVersion() {
   const int version = WebPGetDecoderVersion();
-  return std::to_string(version >> 16) + "." + std::to_string(version >> 8 & 255) + "." + std::to_string(version & 255);
+  return std::to_string(version >> 16) + "." + std::to_string(version >> 8 & 255) + "." +
+         std::to_string(version & 255);
 }
 constexpr FormatLibrary kLibraries[] = {{"libwebp", WebpVersion, TrLater("WebP")}};
 
@@ -34,7 +35,8 @@ constexpr FormatEntry kRows[] = {{
     .extension = "WEBP"sv,
     .description = "(WEBP) Google WebP"sv,
     .enabled = 1,
-    .flags = FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES | FMT_LAYERED | FMT_TRANSPARENT | FMT_ALPHA,
+    .flags = FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES | FMT_LAYERED |
+             FMT_TRANSPARENT | FMT_ALPHA,
     .animate = WebpAnimate,
     .canRead = true,
     .canWrite = true,

@@ -2,16 +2,18 @@
 //
 //   "RIFF", length, "WEBP", then chunks of name, length and data, padded to an even length:
 //   "VP8 " lossy pixels, or "VP8L" lossless ones; or first of all
-//   "VP8X" flags (1 byte: 2 animation, 4 XMP, 8 EXIF, 16 alpha, 32 ICC), 3 bytes 0, width - 1, height - 1 (3 bytes each)
-//   "ICCP", "ANIM" background and loops, "ANMF" a frame, "ALPH" and "VP8 ", "EXIF", "XMP "
-//   ANMF: x / 2, y / 2, width - 1, height - 1, duration (3 bytes each), flags, then the frame's ALPH, VP8 or VP8L chunk
+//   "VP8X" flags (1 byte: 2 animation, 4 XMP, 8 EXIF, 16 alpha, 32 ICC), 3 bytes 0, width - 1,
+//   height - 1 (3 bytes each) "ICCP", "ANIM" background and loops, "ANMF" a frame, "ALPH" and "VP8
+//   ", "EXIF", "XMP " ANMF: x / 2, y / 2, width - 1, height - 1, duration (3 bytes each), flags,
+//   then the frame's ALPH, VP8 or VP8L chunk
 //
-// Everything becomes 24 bits, with an alpha plane where the file has alpha. Frames of an animation are its pages, each as it
-// stands on the canvas after those before it. EXIF, XMP and ICC profile travel with the picture.
+// Everything becomes 24 bits, with an alpha plane where the file has alpha. Frames of an animation
+// are its pages, each as it stands on the canvas after those before it. EXIF, XMP and ICC profile
+// travel with the picture.
 //
-// The writer makes lossy files of quality WebPQualityFactor, or lossless ones with WebPLossless, which keep every value,
-// also beneath transparent pixels. With WebPAllowMixed it makes both and keeps the smaller.
-// Source: RFC 9649 (2024).
+// The writer makes lossy files of quality WebPQualityFactor, or lossless ones with WebPLossless,
+// which keep every value, also beneath transparent pixels. With WebPAllowMixed it makes both and
+// keeps the smaller. Source: RFC 9649 (2024).
 #include "formats/webp/webp.h"
 
 #include <webp/decode.h>
@@ -35,7 +37,8 @@ namespace fotomill {
 namespace {
 
 constexpr uint8_t kXmpFlag = 4, kExifFlag = 8, kAlphaFlag = 16, kIccFlag = 32;
-constexpr uint8_t kClearAfterwards = 1, kReplace = 2;  // flags of a frame: what becomes of it, and how it is put there
+// flags of a frame: what becomes of it, and how it is put there
+constexpr uint8_t kClearAfterwards = 1, kReplace = 2;
 constexpr size_t kMostFrames = 1 << 16;
 constexpr int kLossy = 1, kLossless = 2;  // WebPBitstreamFeatures::format
 
@@ -44,7 +47,8 @@ struct WebpFrame {
   int32_t width = 0, height = 0;
   int32_t duration = 0;  // milliseconds
   uint8_t flags = 0;
-  std::span<const uint8_t> pixels;  // what the library decodes: the whole file, or the frame's chunks
+  // what the library decodes: the whole file, or the frame's chunks
+  std::span<const uint8_t> pixels;
 };
 
 struct WebpFile {
@@ -85,12 +89,14 @@ void TakeFrame(std::span<const uint8_t> chunk, WebpFile& file) {
   if (file.frames.size() < kMostFrames) file.frames.push_back(frame);
 }
 
-// The chunks beside the pixels. A chunk that is cut short is taken as far as it goes: the library tells what is missing.
+// The chunks beside the pixels. A chunk that is cut short is taken as far as it goes: the library
+// tells what is missing.
 void WalkChunks(std::span<const uint8_t> data, WebpFile& file) {
   RiffWalk walk(data);
   for (RiffPlace place; walk.Next(place);) {
     const auto chunk = data.subspan(place.data, place.size);
-    if (place.name == "ANIM" && chunk.size() >= 6) file.loops = static_cast<uint16_t>(chunk[4] | chunk[5] << 8);
+    if (place.name == "ANIM" && chunk.size() >= 6)
+      file.loops = static_cast<uint16_t>(chunk[4] | chunk[5] << 8);
     if (place.name == "ANMF") TakeFrame(chunk, file);
     if (place.name == "ICCP") file.icc = chunk;
     if (place.name == "EXIF") file.exif = chunk;
@@ -102,7 +108,8 @@ void WalkChunks(std::span<const uint8_t> data, WebpFile& file) {
 Status MeasureFrame(WebpFile& file, WebpFrame& frame) {
   WebPBitstreamFeatures features;
   RETURN_IF_BAD(StatusOf(WebPGetFeatures(frame.pixels.data(), frame.pixels.size(), &features)));
-  const bool inside = int64_t{frame.left} + features.width <= file.width && int64_t{frame.top} + features.height <= file.height;
+  const bool inside = int64_t{frame.left} + features.width <= file.width &&
+                      int64_t{frame.top} + features.height <= file.height;
   if (!inside || features.has_animation != 0) return Status::DamagedFile;
   frame.width = features.width;  // only now: a frame that has a size is drawn
   frame.height = features.height;
@@ -121,13 +128,15 @@ Status ParseFile(std::span<const uint8_t> data, WebpFile& file) {
   file.format = features.format;
   WalkChunks(data, file);
   if (features.has_animation == 0) {
-    file.frames.assign(1, {.width = file.width, .height = file.height, .flags = kReplace, .pixels = data});
+    file.frames.assign(
+        1, {.width = file.width, .height = file.height, .flags = kReplace, .pixels = data});
     return Status::Ok;
   }
   if (file.frames.empty()) return Status::FileReadError;
   // What the frames leave open of the canvas is transparent; the first one tells.
   RETURN_IF_BAD(MeasureFrame(file, file.frames[0]));
-  file.alpha = file.alpha || file.frames[0].width < file.width || file.frames[0].height < file.height;
+  file.alpha =
+      file.alpha || file.frames[0].width < file.width || file.frames[0].height < file.height;
   return Status::Ok;
 }
 
@@ -145,11 +154,13 @@ void Describe(const WebpFile& file, PictureRecord& picture) {
   picture.width = file.width;
   picture.height = file.height;
   picture.bitsPerPixel = 24;
-  picture.alphaFlags = static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (file.alpha ? kHasAlpha : 0));
+  picture.alphaFlags =
+      static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (file.alpha ? kHasAlpha : 0));
   picture.imageBytes = EstimateImageBytes(file.width, file.height, 24);
   MakeDefaultPalette(&picture.palette, nullptr, kDisplayPalette);
   picture.metadata = {};
-  const bool headed = ByteReader(file.exif).Match(kExifHead);  // some programs put it in front, as in JPEG
+  // some programs put it in front, as in JPEG
+  const bool headed = ByteReader(file.exif).Match(kExifHead);
   Assign(picture.metadata.exif, headed ? file.exif.subspan(kExifHead.size()) : file.exif);
   Assign(picture.metadata.xmp, file.xmp);
   Assign(picture.metadata.icc, file.icc);
@@ -164,7 +175,8 @@ void PutRow(const uint8_t* source, int32_t width, bool replace, uint8_t* color, 
       *alpha = source[3];
     } else if (over > 0) {
       for (size_t i = 0; i < 3; ++i) {
-        color[i] = static_cast<uint8_t>((source[i] * over + color[i] * under + (over + under) / 2) / (over + under));
+        color[i] = static_cast<uint8_t>((source[i] * over + color[i] * under + (over + under) / 2) /
+                                        (over + under));
       }
       *alpha = static_cast<uint8_t>(over + under);
     }
@@ -173,17 +185,20 @@ void PutRow(const uint8_t* source, int32_t width, bool replace, uint8_t* color, 
 
 void ClearFrame(const WebpFrame& frame, Canvas& target) {
   for (int32_t y = frame.top; y < frame.top + frame.height; ++y) {
-    std::fill_n(target.image.Row(y).data() + 3 * static_cast<size_t>(frame.left), 3 * static_cast<size_t>(frame.width),
-                uint8_t{0});
+    std::fill_n(target.image.Row(y).data() + 3 * static_cast<size_t>(frame.left),
+                3 * static_cast<size_t>(frame.width), uint8_t{0});
     std::fill_n(target.alpha.Row(y).data() + frame.left, frame.width, uint8_t{0});
   }
 }
 
-// Bytes that the library holds while it decodes a frame: lossless pixels and alpha as a whole, others row by row.
+// Bytes that the library holds while it decodes a frame: lossless pixels and alpha as a whole,
+// others row by row.
 uint64_t DecoderBytes(const WebpFrame& frame) {
   WebPBitstreamFeatures features;
-  if (WebPGetFeatures(frame.pixels.data(), frame.pixels.size(), &features) != VP8_STATUS_OK) return 0;
-  const uint64_t pixels = static_cast<uint64_t>(features.width) * static_cast<uint64_t>(features.height);
+  if (WebPGetFeatures(frame.pixels.data(), frame.pixels.size(), &features) != VP8_STATUS_OK)
+    return 0;
+  const uint64_t pixels =
+      static_cast<uint64_t>(features.width) * static_cast<uint64_t>(features.height);
   if (features.format == kLossless) return 4 * pixels;
   return features.has_alpha != 0 ? 5 * pixels : 0;
 }
@@ -194,7 +209,8 @@ Status ReadFrame(const WebpFrame& frame, Canvas& target) {
   RETURN_IF_BAD(CheckFileMemory(target.image.Bytes().size() + target.alpha.Bytes().size() + stride * static_cast<size_t>(frame.height) +
                                 DecoderBytes(frame)));
   platform::MemoryBlock decoded;
-  if (!decoded.Allocate(stride * static_cast<size_t>(frame.height), platform::Fill::Unset)) return Status::MemoryAllocationError;
+  if (!decoded.Allocate(stride * static_cast<size_t>(frame.height), platform::Fill::Unset))
+    return Status::MemoryAllocationError;
   WebPDecoderConfig config;
   if (WebPInitDecoderConfig(&config) == 0) return Status::MemoryAllocationError;
   config.output.colorspace = MODE_BGRA;
@@ -202,7 +218,8 @@ Status ReadFrame(const WebpFrame& frame, Canvas& target) {
   config.output.u.RGBA = {decoded.Data(), static_cast<int>(stride), decoded.Size()};
   RETURN_IF_BAD(StatusOf(WebPDecode(frame.pixels.data(), frame.pixels.size(), &config)));
   for (int32_t y = 0; y < frame.height; ++y) {
-    PutRow(decoded.Data() + stride * static_cast<size_t>(y), frame.width, (frame.flags & kReplace) != 0,
+    PutRow(decoded.Data() + stride * static_cast<size_t>(y), frame.width,
+           (frame.flags & kReplace) != 0,
            target.image.Row(frame.top + y).data() + 3 * static_cast<size_t>(frame.left),
            target.alpha.Row(frame.top + y).data() + frame.left);
   }
@@ -213,7 +230,8 @@ Status ReadFrame(const WebpFrame& frame, Canvas& target) {
 Status DrawFrame(WebpFile& file, size_t index, Canvas& target) {
   WebpFrame& frame = file.frames[index];
   if (frame.width == 0) RETURN_IF_BAD(MeasureFrame(file, frame));
-  if (index > 0 && (file.frames[index - 1].flags & kClearAfterwards) != 0) ClearFrame(file.frames[index - 1], target);
+  if (index > 0 && (file.frames[index - 1].flags & kClearAfterwards) != 0)
+    ClearFrame(file.frames[index - 1], target);
   return ReadFrame(frame, target);
 }
 
@@ -230,7 +248,8 @@ Status ReadWithAlpha(WebpFile& file, int32_t frames, const PictureRecord& pictur
 void DropOpaqueAlpha(Canvas& target) {
   for (int32_t y = 0; y < target.alpha.Height(); ++y) {
     const uint8_t* row = target.alpha.Row(y).data();
-    if (std::any_of(row, row + target.alpha.Width(), [](uint8_t alpha) { return alpha != 255; })) return;
+    if (std::any_of(row, row + target.alpha.Width(), [](uint8_t alpha) { return alpha != 255; }))
+      return;
   }
   target.alpha.Free();
 }
@@ -243,7 +262,8 @@ Status ReadOpaque(const WebpFile& file, const PictureRecord& picture, Canvas& ta
   config.output.colorspace = MODE_BGR;
   config.output.is_external_memory = 1;
   config.options.flip = 1;
-  config.output.u.RGBA = {target.image.Rows().data(), static_cast<int>(target.image.Stride()), target.image.Rows().size()};
+  config.output.u.RGBA = {target.image.Rows().data(), static_cast<int>(target.image.Stride()),
+                          target.image.Rows().size()};
   RETURN_IF_BAD(StatusOf(WebPDecode(file.frames[0].pixels.data(), file.frames[0].pixels.size(), &config)));
   for (int32_t y = 0; y < file.height; ++y) RETURN_IF_BAD(picture.ReportRow(y));
   return Status::Ok;
@@ -281,8 +301,10 @@ void FillRow(const PictureRecord& picture, int32_t y, uint32_t* target) {
   const bool color = image.Bits() == 24;
   const auto table = image.ColorTable();
   for (int32_t x = 0; x < image.Width(); ++x, ++target) {
-    const uint8_t* pixel = color ? row + 3 * static_cast<size_t>(x) : &table[4 * static_cast<size_t>(image.PixelAt(x, y))];
-    const uint32_t alpha = picture.alpha.Empty() ? 255 : picture.alpha.Row(y)[static_cast<size_t>(x)];
+    const uint8_t* pixel = color ? row + 3 * static_cast<size_t>(x)
+                                 : &table[4 * static_cast<size_t>(image.PixelAt(x, y))];
+    const uint32_t alpha =
+        picture.alpha.Empty() ? 255 : picture.alpha.Row(y)[static_cast<size_t>(x)];
     *target = alpha << 24 | static_cast<uint32_t>(pixel[2] << 16 | pixel[1] << 8 | pixel[0]);
   }
 }
@@ -292,18 +314,21 @@ constexpr uint64_t kLosslessBytes = 32, kLossyBytes = 17, kLossyLeastBytes = 8;
 
 // Refuses what takes too much memory. Lossy encoding has a way that takes longer and less.
 Status ChooseMemory(const PictureRecord& picture, WebPConfig& config) {
-  const uint64_t pixels = static_cast<uint64_t>(picture.image.Width()) * static_cast<uint64_t>(picture.image.Height());
+  const uint64_t pixels =
+      static_cast<uint64_t>(picture.image.Width()) * static_cast<uint64_t>(picture.image.Height());
   const uint64_t held = picture.image.Bytes().size() + picture.alpha.Bytes().size();
   if (config.lossless != 0) return CheckFileMemory(held + kLosslessBytes * pixels);
   config.low_memory = CheckFileMemory(held + kLossyBytes * pixels) == Status::Ok ? 0 : 1;
   return CheckFileMemory(held + kLossyLeastBytes * pixels);
 }
 
-Status Encode(const PictureRecord& picture, bool lossless, int32_t factor, WebPMemoryWriter& encoded) {
+Status Encode(const PictureRecord& picture, bool lossless, int32_t factor,
+              WebPMemoryWriter& encoded) {
   WebPConfig config;
   WebPPicture source;
   const auto quality = static_cast<float>(std::clamp<int32_t>(factor, 0, 100));
-  if (WebPConfigPreset(&config, WEBP_PRESET_DEFAULT, quality) == 0 || WebPPictureInit(&source) == 0) return Status::ResourceError;
+  if (WebPConfigPreset(&config, WEBP_PRESET_DEFAULT, quality) == 0 || WebPPictureInit(&source) == 0)
+    return Status::ResourceError;
   config.lossless = lossless ? 1 : 0;
   config.exact = lossless ? 1 : 0;
   RETURN_IF_BAD(ChooseMemory(picture, config));
@@ -324,8 +349,8 @@ Status Encode(const PictureRecord& picture, bool lossless, int32_t factor, WebPM
   }
   if (WebPEncode(&config, &source) != 0) return Status::Ok;
   if (source.error_code == VP8_ENC_ERROR_USER_ABORT) return Status::FunctionCancelled;
-  const bool memory =
-      source.error_code == VP8_ENC_ERROR_OUT_OF_MEMORY || source.error_code == VP8_ENC_ERROR_BITSTREAM_OUT_OF_MEMORY;
+  const bool memory = source.error_code == VP8_ENC_ERROR_OUT_OF_MEMORY ||
+                      source.error_code == VP8_ENC_ERROR_BITSTREAM_OUT_OF_MEMORY;
   return memory ? Status::MemoryAllocationError : Status::ErrorWritingFile;
 }
 
@@ -343,10 +368,11 @@ uint64_t ChunkBytes(uint64_t data) { return data == 0 ? 0 : 8 + data + data % 2;
 void WriteFile(ByteWriter& out, const PictureRecord& picture, std::span<const uint8_t> encoded) {
   const PictureMetadata& metadata = picture.metadata;
   const auto pixels = encoded.subspan(kRiffHead);
-  const bool extended = pixels.size() >= 18 && std::memcmp(pixels.data(), "VP8X", 4) == 0;  // lossy with alpha
+  // lossy with alpha
+  const bool extended = pixels.size() >= 18 && std::memcmp(pixels.data(), "VP8X", 4) == 0;
   const auto chunks = extended ? pixels.subspan(18) : pixels;
-  const uint64_t length = 4 + 18 + chunks.size() + ChunkBytes(metadata.icc.size()) + ChunkBytes(metadata.exif.size()) +
-                          ChunkBytes(metadata.xmp.size());
+  const uint64_t length = 4 + 18 + chunks.size() + ChunkBytes(metadata.icc.size()) +
+                          ChunkBytes(metadata.exif.size()) + ChunkBytes(metadata.xmp.size());
   const auto side = [](int32_t value) { return static_cast<uint32_t>(value - 1); };
   out.Text("RIFF");
   out.Le32(static_cast<uint32_t>(length));
@@ -397,7 +423,8 @@ Status WebpRead(PictureRecord& picture, const ReadRequest& request) {
   if (request.page < 0 || request.page >= picture.pageCount) return Status::NoImages;
   const bool canvas = file.alpha || file.frames.size() > 1;
   Canvas target;
-  const uint64_t rows = PackedRowBytes(file.width, file.height, 24);  // zeroed pages count only once the frame is drawn
+  // zeroed pages count only once the frame is drawn
+  const uint64_t rows = PackedRowBytes(file.width, file.height, 24);
   RETURN_IF_BAD(CheckFileMemory(canvas ? rows + rows / 3 : rows));
   RETURN_IF_BAD(NewPackedImage(file.width, file.height, &picture.palette, 24, target.image));
   if (canvas) RETURN_IF_BAD(NewAlphaPlane(file.width, file.height, target.alpha));
@@ -419,7 +446,8 @@ Status WebpAnimate(const ReadRequest& request, AnimationPointer& animation) {
 Status WebpWrite(PictureRecord& picture, const WriteOptions& options) {
   const ProgressScope progress(picture);
   if (picture.image.Empty()) return Status::MemoryAllocationError;
-  if (picture.image.Width() > WEBP_MAX_DIMENSION || picture.image.Height() > WEBP_MAX_DIMENSION) return Status::UnsuitableImage;
+  if (picture.image.Width() > WEBP_MAX_DIMENSION || picture.image.Height() > WEBP_MAX_DIMENSION)
+    return Status::UnsuitableImage;
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
   const bool lossless = options.lossless || options.encode.webpLossless;

@@ -7,9 +7,9 @@
 
 namespace fotomill {
 
-// WebP. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when the file ends before its pixels,
-// MemoryAllocationError (6), UnsupportedFormat (8), NoImages (20) for a frame that is not there. Frames of an animation are
-// pages.
+// WebP. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when the file ends before
+// its pixels, MemoryAllocationError (6), UnsupportedFormat (8), NoImages (20) for a frame that is
+// not there. Frames of an animation are pages.
 Status WebpInfo(PictureRecord& picture, const ReadRequest& request);
 Status WebpRead(PictureRecord& picture, const ReadRequest& request);
 Status WebpAnimate(const ReadRequest& request, AnimationPointer& animation);

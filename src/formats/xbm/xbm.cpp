@@ -7,14 +7,16 @@
 //
 // A value holds eight pixels of a row, the leftmost in its lowest bit; a set bit is black.
 //
-// Reads the sizes from lines that contain "#define" and "width" or "height" anywhere; when a line has both, because the
-// picture is named after one of them, the later word counts. The values begin behind the first line that contains
-// "bits" but no "#define"; each is the two characters behind the next lower-case x, of which any that is no digit
-// counts as 0. Lines are taken in pieces of at most 260 characters.
+// Reads the sizes from lines that contain "#define" and "width" or "height" anywhere; when a line
+// has both, because the picture is named after one of them, the later word counts. The values begin
+// behind the first line that contains "bits" but no "#define"; each is the two characters behind
+// the next lower-case x, of which any that is no digit counts as 0. Lines are taken in pieces of at
+// most 260 characters.
 //
-// Where the width is no multiple of 8, the picture lies at the end of each row of values in place of its beginning:
-// reading drops the row's first pixels and shows its padding, writing puts black padding in front. What this program
-// wrote it reads back as it was; pictures of other programs appear moved to the left.
+// Where the width is no multiple of 8, the picture lies at the end of each row of values in place
+// of its beginning: reading drops the row's first pixels and shows its padding, writing puts black
+// padding in front. What this program wrote it reads back as it was; pictures of other programs
+// appear moved to the left.
 //
 // Writes twelve values a line, without a semicolon behind the brace.
 //
@@ -59,7 +61,9 @@ constexpr std::array<uint8_t, 256> kDigitValues = MakeDigitValues();
 class XbmText {
  public:
   explicit XbmText(std::span<const uint8_t> bytes)
-      : next_(reinterpret_cast<const char*>(bytes.data())), end_(next_ + bytes.size()), start_(next_) {}
+      : next_(reinterpret_cast<const char*>(bytes.data())),
+        end_(next_ + bytes.size()),
+        start_(next_) {}
 
   // The next line with its line end, or the next piece of a long one. False at the end.
   bool Line(std::string_view& line) {
@@ -67,7 +71,9 @@ class XbmText {
     if (next_ == end_ || scanned >= limits.textScanBytes) return false;
     const size_t most = std::min(kLineCharacters, static_cast<size_t>(end_ - next_));
     const void* lineEnd = std::memchr(next_, '\n', most);
-    const size_t size = lineEnd == nullptr ? most : static_cast<size_t>(static_cast<const char*>(lineEnd) + 1 - next_);
+    const size_t size = lineEnd == nullptr
+                            ? most
+                            : static_cast<size_t>(static_cast<const char*>(lineEnd) + 1 - next_);
     line = {next_, size};
     next_ += size;
     return true;
@@ -75,11 +81,12 @@ class XbmText {
 
   // The next value. False when the text ends first.
   bool Value(uint8_t& value) {
-    const char* const scanEnd = next_ + std::min(static_cast<uint64_t>(end_ - next_), limits.textScanBytes);
+    const char* const scanEnd =
+        next_ + std::min(static_cast<uint64_t>(end_ - next_), limits.textScanBytes);
     while (next_ != scanEnd && *next_ != 'x') ++next_;
     if (end_ - next_ < 3 || next_ == scanEnd) return false;
-    value =
-        static_cast<uint8_t>(kDigitValues[static_cast<uint8_t>(next_[1])] << 4 | kDigitValues[static_cast<uint8_t>(next_[2])]);
+    value = static_cast<uint8_t>(kDigitValues[static_cast<uint8_t>(next_[1])] << 4 |
+                                 kDigitValues[static_cast<uint8_t>(next_[2])]);
     next_ += 3;
     return true;
   }
@@ -93,9 +100,12 @@ class XbmText {
   const char* start_;
 };
 
-bool Contains(std::string_view text, std::string_view word) { return text.find(word) != std::string_view::npos; }
+bool Contains(std::string_view text, std::string_view word) {
+  return text.find(word) != std::string_view::npos;
+}
 
-// The number behind the word that starts at `position`: past the next blank or tab and all that follow it.
+// The number behind the word that starts at `position`: past the next blank or tab and all that
+// follow it.
 int64_t NumberBehind(std::string_view line, size_t position) {
   constexpr std::string_view kBlanks = " \t";
   const size_t wordEnd = std::min(line.find_first_of(kBlanks, position), line.size());
@@ -109,7 +119,8 @@ XbmSize ParseSize(std::span<const uint8_t> bytes) {
   std::string_view line;
   while ((size.width == 0 || size.height == 0) && text.Line(line)) {
     if (!Contains(line, "#define")) continue;
-    const size_t lastWidth = line.rfind("width") + 1, lastHeight = line.rfind("height") + 1;  // 0: not there
+    // 0: not there
+    const size_t lastWidth = line.rfind("width") + 1, lastHeight = line.rfind("height") + 1;
     if (lastWidth > lastHeight) size.width = NumberBehind(line, line.find("width"));
     if (lastHeight > lastWidth) size.height = NumberBehind(line, line.find("height"));
   }
@@ -117,7 +128,8 @@ XbmSize ParseSize(std::span<const uint8_t> bytes) {
 }
 
 Status CheckSize(const XbmSize& size) {
-  const bool fits = size.width > 0 && size.width <= INT32_MAX && size.height > 0 && size.height <= INT32_MAX;
+  const bool fits =
+      size.width > 0 && size.width <= INT32_MAX && size.height > 0 && size.height <= INT32_MAX;
   return fits ? Status::Ok : Status::DamagedFile;
 }
 
@@ -132,7 +144,8 @@ bool SkipToValues(XbmText& text) {
 constexpr std::array<uint8_t, 256> MakeMirrorTable() {
   std::array<uint8_t, 256> table{};
   for (unsigned i = 0; i < 256; ++i) {
-    for (unsigned bit = 0; bit < 8; ++bit) table[i] |= static_cast<uint8_t>((i >> bit & 1) << (7 - bit));
+    for (unsigned bit = 0; bit < 8; ++bit)
+      table[i] |= static_cast<uint8_t>((i >> bit & 1) << (7 - bit));
   }
   return table;
 }
@@ -155,7 +168,8 @@ bool DecodeRow(XbmText& text, size_t width, std::span<uint8_t> row) {
   return true;
 }
 
-// The values of a row of `width` pixels, `values` as long as they are many. Padding bits of `row` may hold anything.
+// The values of a row of `width` pixels, `values` as long as they are many. Padding bits of `row`
+// may hold anything.
 void EncodeRow(std::span<const uint8_t> row, size_t width, std::span<uint8_t> values) {
   const size_t padding = 8 * values.size() - width;  // pixels in front
   unsigned previous = 0;
@@ -229,7 +243,8 @@ Status DescribePicture(const platform::FileView& file, PictureRecord& picture) {
   picture.imageBytes = EstimateImageBytes(picture.width, picture.height, 1);
   picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
   MakeDefaultPalette(&picture.palette, &picture.bitsPerPixel, kBlackAndWhitePalette);
-  picture.simplified = picture.width % 8 != 0 || picture.height % 8 != 0;  // rows of other lengths mean another thing elsewhere
+  // rows of other lengths mean another thing elsewhere
+  picture.simplified = picture.width % 8 != 0 || picture.height % 8 != 0;
   return Status::Ok;
 }
 
@@ -250,12 +265,14 @@ Status XbmRead(PictureRecord& picture, const ReadRequest& request) {
   if (!file.Open(request.fileName)) return Status::FileOpenError;
   RETURN_IF_BAD(DescribePicture(file, picture));
   XbmText text(file.Bytes());
-  if (!SkipToValues(text) || text.Left() / kValueBytes < picture.imageBytes) return Status::DamagedFile;
+  if (!SkipToValues(text) || text.Left() / kValueBytes < picture.imageBytes)
+    return Status::DamagedFile;
 
   PackedImage image;
   RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette, 1, image, platform::Fill::Unset));
   for (int32_t y = 0; y < picture.height; ++y) {
-    if (!DecodeRow(text, static_cast<size_t>(picture.width), image.Row(y))) return Status::DamagedFile;
+    if (!DecodeRow(text, static_cast<size_t>(picture.width), image.Row(y)))
+      return Status::DamagedFile;
     file.DropBefore(text.Position());
     RETURN_IF_BAD(picture.ReportRow(y));
   }

@@ -9,12 +9,13 @@
 
 namespace fotomill {
 
-// Numbers of an EXIF block in its byte order. Bytes at or beyond the end read as 0: a block that points out of itself is
-// cut short there, it does not fail. Does not own the bytes.
+// Numbers of an EXIF block in its byte order. Bytes at or beyond the end read as 0: a block that
+// points out of itself is cut short there, it does not fail. Does not own the bytes.
 class ExifBytes {
  public:
   ExifBytes() = default;
-  ExifBytes(std::span<const uint8_t> bytes, bool bigEndian) : bytes_(bytes), bigEndian_(bigEndian) {}
+  ExifBytes(std::span<const uint8_t> bytes, bool bigEndian)
+      : bytes_(bytes), bigEndian_(bigEndian) {}
 
   // The block, and numbers at offsets from its start in its own byte order.
   uint64_t Size() const { return bytes_.size(); }
@@ -47,7 +48,8 @@ class ExifBytes {
   bool bigEndian_ = false;
 };
 
-// Types that TIFF knows and EXIF does not. Sources: TIFF 6.0, section 2; Adobe PageMaker 6.0 TIFF Technical Notes (1995).
+// Types that TIFF knows and EXIF does not. Sources: TIFF 6.0, section 2; Adobe PageMaker 6.0 TIFF
+// Technical Notes (1995).
 inline constexpr uint16_t kTiffFloat = 11;
 inline constexpr uint16_t kTiffDouble = 12;  // 8 bytes
 inline constexpr uint16_t kTiffIfd = 13;  // 4 bytes: the offset of a directory
@@ -58,13 +60,14 @@ inline constexpr uint16_t kTiffIfd = 13;  // 4 bytes: the offset of a directory
 //        0    2  tag
 //        2    2  type
 //        4    4  number of values
-//        8    4  the values, or, when they need more than 4 bytes, their offset from the start of the block
+//        8    4  the values, or, when they need more than 4 bytes, their offset from the start of
+//        the block
 inline constexpr uint64_t kExifCountSize = 2;
 inline constexpr uint64_t kExifEntrySize = 12;
 inline constexpr uint64_t kExifLinkSize = 4;
 
-// Bytes that one value of a type takes in the block: those of TIFF 6.0, so 2 for SSHORT; 1 for unknown types. FLOAT,
-// DOUBLE and IFD have no text, but an edit must know where their values end.
+// Bytes that one value of a type takes in the block: those of TIFF 6.0, so 2 for SSHORT; 1 for
+// unknown types. FLOAT, DOUBLE and IFD have no text, but an edit must know where their values end.
 constexpr uint32_t ExifStoredSize(uint16_t type) {
   switch (type) {
     case kExifShort:

@@ -31,7 +31,8 @@ constexpr ThumbnailField kThumbnailFields[] = {
 constexpr uint64_t kResolutionSize = 8;
 
 // A block whose first directory is empty.
-constexpr uint8_t kEmptyBlock[] = {'I', 'I', kExifMagic, 0, kExifHeaderSize, 0, 0, 0, 0, 0, 0, 0, 0, 0};
+constexpr uint8_t kEmptyBlock[] = {'I', 'I', kExifMagic, 0, kExifHeaderSize, 0, 0, 0, 0, 0,
+                                   0,   0,   0,          0};
 
 struct Range {
   uint64_t begin, end;
@@ -42,7 +43,9 @@ struct Directory {
   uint64_t offset = 0;
   uint32_t count = 0;
   bool linked = false;  // so does the link to the next one
-  uint64_t EntryOffset(uint32_t index) const { return offset + kExifCountSize + index * kExifEntrySize; }
+  uint64_t EntryOffset(uint32_t index) const {
+    return offset + kExifCountSize + index * kExifEntrySize;
+  }
   uint64_t LinkOffset() const { return EntryOffset(count); }
   Range Whole() const { return {offset, LinkOffset() + (linked ? kExifLinkSize : 0)}; }
 };
@@ -52,7 +55,8 @@ std::optional<Directory> DirectoryAt(const ExifBytes& block, uint64_t offset) {
   Directory directory{offset, block.U16(offset)};
   const uint64_t room = block.Size() - offset - kExifCountSize;
   directory.linked = directory.count * kExifEntrySize + kExifLinkSize <= room;
-  directory.count = static_cast<uint32_t>(std::min<uint64_t>(directory.count, room / kExifEntrySize));
+  directory.count =
+      static_cast<uint32_t>(std::min<uint64_t>(directory.count, room / kExifEntrySize));
   if (directory.count == 0) return {};
   return directory;
 }
@@ -62,7 +66,8 @@ std::optional<Directory> FirstDirectory(const ExifBytes& block) {
   return DirectoryAt(block, block.U32(4));
 }
 
-std::optional<ExifField> FindField(const ExifBytes& block, const Directory& directory, uint16_t tag) {
+std::optional<ExifField> FindField(const ExifBytes& block, const Directory& directory,
+                                   uint16_t tag) {
   for (uint32_t i = 0; i < directory.count; ++i) {
     const ExifField field = ReadExifField(block, directory.EntryOffset(i));
     if (field.tag == tag) return field;
@@ -77,7 +82,8 @@ uint32_t FieldNumber(const ExifBytes& block, const ExifField& field) {
 }
 
 // The directory that an entry of `directory` points to.
-std::optional<Directory> SubDirectory(const ExifBytes& block, const Directory& directory, uint16_t pointerTag) {
+std::optional<Directory> SubDirectory(const ExifBytes& block, const Directory& directory,
+                                      uint16_t pointerTag) {
   const auto pointer = FindField(block, directory, pointerTag);
   return pointer ? DirectoryAt(block, FieldNumber(block, *pointer)) : std::nullopt;
 }
@@ -94,20 +100,24 @@ void Put32(std::span<uint8_t> block, bool bigEndian, uint64_t offset, uint32_t n
 }
 
 // Rewrites an entry behind its tag as one number, kept in the entry.
-void PutField(std::span<uint8_t> block, bool bigEndian, uint64_t entryOffset, uint16_t type, uint32_t number) {
+void PutField(std::span<uint8_t> block, bool bigEndian, uint64_t entryOffset, uint16_t type,
+              uint32_t number) {
   Put16(block, bigEndian, entryOffset + 2, type);
   Put32(block, bigEndian, entryOffset + 4, 1);
   Put32(block, bigEndian, entryOffset + 8, type == kExifShort && bigEndian ? number << 16 : number);
 }
 
-void SetField(std::span<uint8_t> bytes, const ExifBytes& block, const Directory& directory, uint16_t tag, int32_t number) {
+void SetField(std::span<uint8_t> bytes, const ExifBytes& block, const Directory& directory,
+              uint16_t tag, int32_t number) {
   const auto field = FindField(block, directory, tag);
   if (number <= 0 || !field) return;
   const bool asLong = number > 0xffff || (field->type == kExifLong && field->count == 1);
-  PutField(bytes, block.BigEndian(), field->entryOffset, asLong ? kExifLong : kExifShort, static_cast<uint32_t>(number));
+  PutField(bytes, block.BigEndian(), field->entryOffset, asLong ? kExifLong : kExifShort,
+           static_cast<uint32_t>(number));
 }
 
-// Moves the first directory to the end of the block, with an empty SHORT more in the order of the tags.
+// Moves the first directory to the end of the block, with an empty SHORT more in the order of the
+// tags.
 void AddField(std::vector<uint8_t>& block, const Directory& first, uint16_t tag) {
   const bool bigEndian = OpenExifBytes(block).BigEndian();
   const uint64_t offset = block.size() + block.size() % 2;
@@ -117,10 +127,12 @@ void AddField(std::vector<uint8_t>& block, const Directory& first, uint16_t tag)
   uint32_t before = 0;
   while (before < first.count && numbers.U16(first.EntryOffset(before)) < tag) ++before;
   const auto copy = [&](uint64_t from, uint64_t size, uint64_t to) {
-    std::copy_n(block.begin() + static_cast<std::ptrdiff_t>(from), size, block.begin() + static_cast<std::ptrdiff_t>(to));
+    std::copy_n(block.begin() + static_cast<std::ptrdiff_t>(from), size,
+                block.begin() + static_cast<std::ptrdiff_t>(to));
   };
   copy(first.EntryOffset(0), before * kExifEntrySize, moved.EntryOffset(0));
-  copy(first.EntryOffset(before), (first.count - before) * kExifEntrySize, moved.EntryOffset(before + 1));
+  copy(first.EntryOffset(before), (first.count - before) * kExifEntrySize,
+       moved.EntryOffset(before + 1));
   if (first.linked) copy(first.LinkOffset(), kExifLinkSize, moved.LinkOffset());
   Put16(block, bigEndian, moved.offset, static_cast<uint16_t>(moved.count));
   Put16(block, bigEndian, moved.EntryOffset(before), tag);
@@ -134,15 +146,20 @@ void AddRanges(const ExifBytes& block, const Directory& directory, std::vector<R
   for (uint32_t i = 0; i < directory.count; ++i) {
     const ExifField field = ReadExifField(block, directory.EntryOffset(i));
     if (field.valueOffset >= block.Size()) continue;
-    ranges.push_back({field.valueOffset, std::min(field.valueOffset + field.ValueSize(), block.Size())});
+    ranges.push_back(
+        {field.valueOffset, std::min(field.valueOffset + field.ValueSize(), block.Size())});
   }
 }
 
-// Adds what the entries of a thumbnail's directory point to: a JPEG stream, or the strips of an uncompressed picture.
-void AddThumbnailRanges(const ExifBytes& block, const Directory& directory, std::vector<Range>& ranges) {
-  constexpr uint16_t kPairs[][2] = {{kThumbnailOffsetTag, kThumbnailSizeTag}, {kStripOffsets, kStripSizes}};
+// Adds what the entries of a thumbnail's directory point to: a JPEG stream, or the strips of an
+// uncompressed picture.
+void AddThumbnailRanges(const ExifBytes& block, const Directory& directory,
+                        std::vector<Range>& ranges) {
+  constexpr uint16_t kPairs[][2] = {{kThumbnailOffsetTag, kThumbnailSizeTag},
+                                    {kStripOffsets, kStripSizes}};
   for (const auto& [offsetTag, sizeTag] : kPairs) {
-    const auto offsetField = FindField(block, directory, offsetTag), sizeField = FindField(block, directory, sizeTag);
+    const auto offsetField = FindField(block, directory, offsetTag),
+               sizeField = FindField(block, directory, sizeTag);
     if (!offsetField || !sizeField) continue;
     const uint64_t offset = FieldNumber(block, *offsetField);
     if (offset >= block.Size()) continue;
@@ -150,7 +167,8 @@ void AddThumbnailRanges(const ExifBytes& block, const Directory& directory, std:
   }
 }
 
-// Everything that stays when the thumbnail goes: header, first, EXIF, GPS and interoperability directories.
+// Everything that stays when the thumbnail goes: header, first, EXIF, GPS and interoperability
+// directories.
 std::vector<Range> KeptRanges(const ExifBytes& block, const Directory& first) {
   constexpr uint16_t kInteroperabilityPointer = 0xA005;
   std::vector<Range> kept = {{0, kExifHeaderSize}};
@@ -158,7 +176,8 @@ std::vector<Range> KeptRanges(const ExifBytes& block, const Directory& first) {
   if (const auto gps = SubDirectory(block, first, kGpsPointerTag)) AddRanges(block, *gps, kept);
   if (const auto exif = SubDirectory(block, first, kExifPointerTag)) {
     AddRanges(block, *exif, kept);
-    if (const auto other = SubDirectory(block, *exif, kInteroperabilityPointer)) AddRanges(block, *other, kept);
+    if (const auto other = SubDirectory(block, *exif, kInteroperabilityPointer))
+      AddRanges(block, *other, kept);
   }
   return kept;
 }
@@ -236,8 +255,10 @@ bool PutExifOrientation(std::vector<uint8_t>& block, int32_t orientation) {
   const ExifBytes numbers = OpenExifBytes(block);
   if (numbers.U16(2) != kExifMagic) return false;
   const uint64_t begin = numbers.U32(4);
-  const bool empty = begin >= kExifHeaderSize && begin + kExifCountSize <= block.size() && numbers.U16(begin) == 0;
-  const auto first = empty ? std::optional(Directory{begin, 0, begin + kExifCountSize + kExifLinkSize <= block.size()})
+  const bool empty =
+      begin >= kExifHeaderSize && begin + kExifCountSize <= block.size() && numbers.U16(begin) == 0;
+  const auto first = empty ? std::optional(Directory{
+                                 begin, 0, begin + kExifCountSize + kExifLinkSize <= block.size()})
                            : FirstDirectory(numbers);
   if (!first) return false;
   if (!FindField(numbers, *first, kOrientation)) AddField(block, *first, kOrientation);
@@ -254,8 +275,8 @@ void DropExifThumbnail(std::vector<uint8_t>& block) {
   JoinRanges(dropped);
   Put32(block, numbers.BigEndian(), first->LinkOffset(), 0);
   for (const Range& range : Difference(dropped, kept)) {
-    std::fill(block.begin() + static_cast<std::ptrdiff_t>(range.begin), block.begin() + static_cast<std::ptrdiff_t>(range.end),
-              uint8_t{0});
+    std::fill(block.begin() + static_cast<std::ptrdiff_t>(range.begin),
+              block.begin() + static_cast<std::ptrdiff_t>(range.end), uint8_t{0});
   }
   // Zeros that nothing refers to need not be kept: what is read beyond the end is zero anyway.
   size_t size = block.size();
@@ -263,13 +284,15 @@ void DropExifThumbnail(std::vector<uint8_t>& block) {
   block.resize(size);
 }
 
-bool ReplaceExifThumbnail(std::vector<uint8_t>& block, std::span<const uint8_t> thumbnail, uint64_t most) {
+bool ReplaceExifThumbnail(std::vector<uint8_t>& block, std::span<const uint8_t> thumbnail,
+                          uint64_t most) {
   DropExifThumbnail(block);
   const bool bigEndian = OpenExifBytes(block).BigEndian();
   const auto first = FirstDirectory(OpenExifBytes(block));
   const uint64_t offset = block.size() + block.size() % 2;  // directories begin at even offsets
   const Directory second{offset, std::size(kThumbnailFields), true};
-  const uint64_t resolution = second.Whole().end, begin = resolution + kResolutionSize, end = begin + thumbnail.size();
+  const uint64_t resolution = second.Whole().end, begin = resolution + kResolutionSize,
+                 end = begin + thumbnail.size();
   if (!first || !first->linked || thumbnail.empty() || end > most || end > UINT32_MAX) return false;
   block.resize(begin);
   Put32(block, bigEndian, first->LinkOffset(), static_cast<uint32_t>(offset));

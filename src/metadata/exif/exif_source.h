@@ -12,22 +12,24 @@ namespace fotomill {
 // The EXIF block of a picture file:
 //
 //   JPEG  the first APP1 segment that begins with "Exif" and two bytes; the block follows them
-//   TIFF  the whole file, as well as any bare block: "II" or "MM", or any mark before a big-endian 42
-//   PNG   the eXIf chunk
-//   WebP  the EXIF chunk
-//   HD Photo: the EXIF and GPS directories among the file's own, gathered into a block
+//   TIFF  the whole file, as well as any bare block: "II" or "MM", or any mark before a big-endian
+//   42 PNG   the eXIf chunk WebP  the EXIF chunk HD Photo: the EXIF and GPS directories among the
+//   file's own, gathered into a block
 //
-// "Exif" and two zero bytes in front of a block are also taken off where the container does not ask for them. Only the
-// head of the file is read, and beyond it the places where segments and chunks begin.
-// Sources: CIPA DC-008-2012, section 4.7; PNG, third edition, section 11.3.3.6; RFC 9649, section 2.7.1.5.
+// "Exif" and two zero bytes in front of a block are also taken off where the container does not ask
+// for them. Only the head of the file is read, and beyond it the places where segments and chunks
+// begin. Sources: CIPA DC-008-2012, section 4.7; PNG, third edition, section 11.3.3.6; RFC 9649,
+// section 2.7.1.5.
 class ExifSource {
  public:
-  // Finds the block of a file. Ok with an empty block when the file has none or is of another kind; FileOpenError (1) when
-  // it cannot be opened, FileReadError (3) when reading fails, MemoryAllocationError (6) for a block beyond the limit.
+  // Finds the block of a file. Ok with an empty block when the file has none or is of another kind;
+  // FileOpenError (1) when it cannot be opened, FileReadError (3) when reading fails,
+  // MemoryAllocationError (6) for a block beyond the limit.
   Status Open(const char* path);
   // From the byte order on; lives as long as the source.
   std::span<const uint8_t> Block() const { return block_; }
-  // False when the file was cut short by another program meanwhile, so that the block may have read as zeros.
+  // False when the file was cut short by another program meanwhile, so that the block may have read
+  // as zeros.
   bool Intact() const { return file_.Intact(); }
 
  private:

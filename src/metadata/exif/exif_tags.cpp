@@ -21,11 +21,13 @@ constexpr uint16_t kTrue[] = {'T'};
 constexpr uint16_t kResolutionUnits[] = {2, 3};
 constexpr uint16_t kCompressions[] = {1, 6};
 constexpr uint16_t kMeteringModes[] = {0, 1, 2, 3, 4, 5, 6, 255};
-constexpr uint16_t kLightSources[] = {0, 1, 2, 3, 4, 9, 10, 11, 12, 13, 14, 15, 17, 18, 19, 20, 21, 22, 23, 24, 255};
+constexpr uint16_t kLightSources[] = {0,  1,  2,  3,  4,  9,  10, 11, 12, 13, 14,
+                                      15, 17, 18, 19, 20, 21, 22, 23, 24, 255};
 constexpr uint16_t kColorSpaces[] = {0, 1};
 
-// Users know the lists as they stand, though some are not those of the standard: the orientations 3 and 4 carry each
-// other's words, a white balance of 0 reads "None", and a sensing method has the words of the next one.
+// Users know the lists as they stand, though some are not those of the standard: the orientations 3
+// and 4 carry each other's words, a white balance of 0 reads "None", and a sensing method has the
+// words of the next one.
 // clang-format off
 constexpr ExifWordList kAltitudeWords{"Sea level;Sea level reference"};
 constexpr ExifWordList kLatitudeWords{"North;South", Letter, kNorth, 1};
@@ -202,8 +204,8 @@ constexpr ExifTag kTags[] = {
 constexpr size_t kTagCount = 127;
 static_assert(std::size(kTags) == kTagCount);
 
-// Rows by tag number: an open-addressed table of row numbers, built by the compiler, which also refuses a tag that is
-// there twice.
+// Rows by tag number: an open-addressed table of row numbers, built by the compiler, which also
+// refuses a tag that is there twice.
 constexpr size_t kSlotCount = 512;
 constexpr uint8_t kEmptySlot = 0xff;
 constexpr size_t FirstSlot(uint16_t tag) { return (tag * 0x9e3779b1u >> 16) % kSlotCount; }
@@ -224,7 +226,8 @@ constexpr auto kSlots = MakeSlots();
 
 static_assert(std::ranges::all_of(kTags,
                                   [](const ExifTag& row) {
-                                    return (row.words != nullptr) == (row.rule == Words || row.rule == Components);
+                                    return (row.words != nullptr) ==
+                                           (row.rule == Words || row.rule == Components);
                                   }),
               "word lists go with the rules that read them");
 
@@ -239,9 +242,13 @@ constexpr TypeFacts kTypes[] = {
 
 }  // namespace
 
-uint32_t ExifTypeSize(uint16_t type) { return type >= kExifByte && type <= kExifSRational ? kTypes[type - 1].size : 1; }
+uint32_t ExifTypeSize(uint16_t type) {
+  return type >= kExifByte && type <= kExifSRational ? kTypes[type - 1].size : 1;
+}
 
-std::string_view ExifTypeLabel(uint16_t type) { return kTypes[std::clamp<int>(type, kExifByte, kExifSRational) - 1].label; }
+std::string_view ExifTypeLabel(uint16_t type) {
+  return kTypes[std::clamp<int>(type, kExifByte, kExifSRational) - 1].label;
+}
 
 std::span<const ExifTag> ExifTags() { return kTags; }
 

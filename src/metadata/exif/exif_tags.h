@@ -18,10 +18,11 @@ inline constexpr uint16_t kExifSShort = 8;  // 2 bytes, signed
 inline constexpr uint16_t kExifSLong = 9;  // 4 bytes, signed
 inline constexpr uint16_t kExifSRational = 10;  // two SLONGs
 
-// Bytes of one value of a type in the editor's sense: 2 for SHORT, 4 and 8 for the long types and the rationals, 1 for
-// every other number, whatever TIFF says of it.
+// Bytes of one value of a type in the editor's sense: 2 for SHORT, 4 and 8 for the long types and
+// the rationals, 1 for every other number, whatever TIFF says of it.
 uint32_t ExifTypeSize(uint16_t type);
-// The label that the list shows when `ExifShowTypes` is set, such as "[SHORT]". Types below 1 count as 1, above 10 as 10.
+// The label that the list shows when `ExifShowTypes` is set, such as "[SHORT]". Types below 1 count
+// as 1, above 10 as 10.
 std::string_view ExifTypeLabel(uint16_t type);
 
 // How a tag's value is put into words, beyond what its type alone says.
@@ -47,8 +48,8 @@ enum class ExifWordKey : uint8_t {
   Letter,  // the first character of ASCII
 };
 
-// A word list: items separated by ";" and picked by index. Without `codes` the index is the value itself, with them it
-// is the value's position among them, or `otherwise` when it is not there.
+// A word list: items separated by ";" and picked by index. Without `codes` the index is the value
+// itself, with them it is the value's position among them, or `otherwise` when it is not there.
 struct ExifWordList {
   std::string_view words;
   ExifWordKey key = ExifWordKey::Number;
@@ -58,7 +59,8 @@ struct ExifWordList {
 
 // What the editor may do with a tag.
 inline constexpr uint8_t kExifOrdinary = 0;
-inline constexpr uint8_t kExifStructural = 1;  // sizes, strips, offsets, color layout: shown, not edited
+// sizes, strips, offsets, color layout: shown, not edited
+inline constexpr uint8_t kExifStructural = 1;
 inline constexpr uint8_t kExifVersion = 2;
 inline constexpr uint8_t kExifOpaque = 7;  // pointers, maker notes, patterns
 
@@ -67,7 +69,8 @@ struct ExifTag {
   std::string_view name;  // as shown to the user
   uint16_t tag;
   uint8_t editClass;
-  int32_t minimum, maximum;  // accepted by the editor, both 0 when unbounded; rationals in thousandths
+  // accepted by the editor, both 0 when unbounded; rationals in thousandths
+  int32_t minimum, maximum;
   uint16_t type;             // in which the editor writes the value
   ExifRule rule;
   const ExifWordList* words = nullptr;  // for ExifRule::Words and Components
@@ -77,14 +80,17 @@ struct ExifTag {
 inline constexpr int32_t kNoExifTag = -1;
 
 // The dictionary in the order in which the editor offers it; each tag number stands in it once.
-// Source: CIPA DC-008-2012, "Exchangeable image file format for digital still cameras: Exif Version 2.3".
+// Source: CIPA DC-008-2012, "Exchangeable image file format for digital still cameras: Exif
+// Version 2.3".
 std::span<const ExifTag> ExifTags();
-// Row of a tag, by number alone: GPS tags and the others do not clash. Null, or kNoExifTag, if there is none.
+// Row of a tag, by number alone: GPS tags and the others do not clash. Null, or kNoExifTag, if
+// there is none.
 const ExifTag* FindExifTag(uint16_t tag);
 int32_t ExifTagIndex(uint16_t tag);
 // The display name; "Unknown" for a tag without a row.
 std::string_view ExifTagName(uint16_t tag);
-// A copy of the row; for a tag without one, a plain row with the name "Unknown" and the number filled in.
+// A copy of the row; for a tag without one, a plain row with the name "Unknown" and the number
+// filled in.
 ExifTag CopyExifTag(uint16_t tag);
 // The editor's bounds, both 0 if there are none, and the edit class, 0 for a tag without a row.
 struct ExifRange {

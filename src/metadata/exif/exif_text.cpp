@@ -10,20 +10,23 @@ namespace fotomill {
 
 namespace {
 
-constexpr uint64_t kGrowth = 4096;  // bytes; the block starts with so many and stays a multiple of them
+// bytes; the block starts with so many and stays a multiple of them
+constexpr uint64_t kGrowth = 4096;
 
-// Whether a text is shown as it stands, being printable ASCII. Eight characters at a time: the text of every value comes
-// through here.
+// Whether a text is shown as it stands, being printable ASCII. Eight characters at a time: the text
+// of every value comes through here.
 bool IsPlain(std::string_view text) {
   constexpr uint64_t kOnes = 0x0101010101010101, kTops = 0x80 * kOnes;
   const auto plainEight = [](const char* place) {
     uint64_t word;
     std::memcpy(&word, place, sizeof word);
-    const uint64_t belowBlank = (word - 0x20 * kOnes) & ~word;  // in the top bits of its bytes, as the next one
+    // in the top bits of its bytes, as the next one
+    const uint64_t belowBlank = (word - 0x20 * kOnes) & ~word;
     const uint64_t notDelete = (word ^ 0x7f * kOnes) + 0x7f * kOnes;
     return ((belowBlank | ~notDelete | word) & kTops) == 0;
   };
-  if (text.size() < 8) return std::ranges::all_of(text, [](char c) { return c >= 0x20 && c < 0x7f; });
+  if (text.size() < 8)
+    return std::ranges::all_of(text, [](char c) { return c >= 0x20 && c < 0x7f; });
   for (size_t i = 0; i + 8 < text.size(); i += 8) {
     if (!plainEight(text.data() + i)) return false;
   }
@@ -49,9 +52,11 @@ void ExifText::Line(const ExifLine& line) {
     escaped = EscapeControls(text);
     text = escaped;
   }
-  const std::string_view label = options_.showTypes ? ExifTypeLabel(line.value.type) : std::string_view();
+  const std::string_view label =
+      options_.showTypes ? ExifTypeLabel(line.value.type) : std::string_view();
   constexpr std::string_view kIndent = "    ";
-  char* place = Room(kIndent.size() + line.name.size() + (label.empty() ? 0 : 1 + label.size()) + 1 + text.size() + 1);
+  char* place = Room(kIndent.size() + line.name.size() + (label.empty() ? 0 : 1 + label.size()) +
+                     1 + text.size() + 1);
   if (place == nullptr) return;
   place = Put(Put(place, kIndent), line.name);
   if (!label.empty()) place = Put(Put(place, " "), label);
@@ -59,7 +64,9 @@ void ExifText::Line(const ExifLine& line) {
   *Put(place, text) = '\n';
 }
 
-std::string_view ExifText::Text() const { return {reinterpret_cast<const char*>(block_.Data()), used_}; }
+std::string_view ExifText::Text() const {
+  return {reinterpret_cast<const char*>(block_.Data()), used_};
+}
 
 void ExifText::Clear() {
   used_ = 0;

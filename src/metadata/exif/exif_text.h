@@ -13,9 +13,10 @@ struct ExifTextOptions {
   bool showTypes = false;  // the type of each value behind its name
 };
 
-// The lines of a walk as one text, to be printed or copied: "DIRECTORY EXIF", and for each value four blanks, the name, a
-// tab, the value; with `showTypes` a blank and the type's label behind the name. Every line ends in "\n".
-// Control characters and bytes that are not UTF-8 are escaped, so that a value never makes two lines.
+// The lines of a walk as one text, to be printed or copied: "DIRECTORY EXIF", and for each value
+// four blanks, the name, a tab, the value; with `showTypes` a blank and the type's label behind the
+// name. Every line ends in "\n". Control characters and bytes that are not UTF-8 are escaped, so
+// that a value never makes two lines.
 class ExifText : public ExifSink {
  public:
   explicit ExifText(const ExifTextOptions& options) : options_(options) {}

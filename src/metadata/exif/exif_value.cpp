@@ -32,17 +32,22 @@ void AddTwoDigits(std::string& buffer, uint32_t number) {
 
 void AddFixed(std::string& buffer, double number, int decimals) {
   char digits[32];  // 2^32 at most in front of the point
-  const auto end = std::to_chars(digits, digits + sizeof digits, number, std::chars_format::fixed, decimals).ptr;
+  const auto end =
+      std::to_chars(digits, digits + sizeof digits, number, std::chars_format::fixed, decimals).ptr;
   buffer.append(digits, static_cast<size_t>(end - digits));
 }
 
 struct Rational {
   int64_t numerator, denominator;
-  double Value() const { return denominator == 0 ? 0.0 : static_cast<double>(numerator) / static_cast<double>(denominator); }
+  double Value() const {
+    return denominator == 0 ? 0.0
+                            : static_cast<double>(numerator) / static_cast<double>(denominator);
+  }
 };
 
 Rational RationalAt(const ExifValue& value, uint64_t index) {
-  const uint32_t numerator = value.bytes.U32(8 * index), denominator = value.bytes.U32(8 * index + 4);
+  const uint32_t numerator = value.bytes.U32(8 * index),
+                 denominator = value.bytes.U32(8 * index + 4);
   if (value.type != kExifSRational) return {numerator, denominator};
   return {static_cast<int32_t>(numerator), static_cast<int32_t>(denominator)};
 }
@@ -59,18 +64,21 @@ int64_t NumberAt(const ExifValue& value, uint64_t index) {
   }
 }
 
-// A rational with three decimals, just as "%.3f" shows the quotient of two doubles. In whole numbers, which is much the
-// quicker way: their exact quotient is too near to a rounding limit for a double only where it is right on it.
+// A rational with three decimals, just as "%.3f" shows the quotient of two doubles. In whole
+// numbers, which is much the quicker way: their exact quotient is too near to a rounding limit for
+// a double only where it is right on it.
 void AddThousandths(std::string& buffer, const Rational& rational) {
   const auto numerator = static_cast<uint64_t>(rational.numerator) * 1000;
   const auto denominator = static_cast<uint64_t>(rational.denominator);
-  if (rational.numerator < 0 || rational.denominator <= 0 || numerator % denominator * 2 == denominator) {
+  if (rational.numerator < 0 || rational.denominator <= 0 ||
+      numerator % denominator * 2 == denominator) {
     return AddFixed(buffer, rational.Value(), 3);
   }
   const uint64_t thousandths = (numerator + denominator / 2) / denominator;
   const uint64_t decimals = thousandths % 1000;
   AddNumber(buffer, static_cast<int64_t>(thousandths / 1000));
-  const char digits[] = {'.', static_cast<char>('0' + decimals / 100), static_cast<char>('0' + decimals / 10 % 10),
+  const char digits[] = {'.', static_cast<char>('0' + decimals / 100),
+                         static_cast<char>('0' + decimals / 10 % 10),
                          static_cast<char>('0' + decimals % 10)};
   buffer.append(digits, sizeof digits);
 }
@@ -83,7 +91,9 @@ void AddValue(std::string& buffer, const ExifValue& value, uint64_t index) {
   }
 }
 
-bool IsNumber(const ExifValue& value) { return value.type == kExifByte || value.type == kExifShort || value.type == kExifLong; }
+bool IsNumber(const ExifValue& value) {
+  return value.type == kExifByte || value.type == kExifShort || value.type == kExifLong;
+}
 bool IsRational(const ExifValue& value) { return value.type == kExifRational; }
 bool IsOpaque(const ExifValue& value) { return value.type == kExifUndefined; }
 
@@ -121,8 +131,9 @@ int64_t WordIndex(const ExifWordList& list, int64_t number) {
 }
 
 Text WordText(const ExifValue& value, const ExifWordList& list) {
-  const bool fits = list.key == ExifWordKey::Letter ? value.type == kExifAscii
-                                                    : IsNumber(value) || (list.key == ExifWordKey::Opaque && IsOpaque(value));
+  const bool fits = list.key == ExifWordKey::Letter
+                        ? value.type == kExifAscii
+                        : IsNumber(value) || (list.key == ExifWordKey::Opaque && IsOpaque(value));
   if (!fits || value.count == 0) return {};
   return ListItem(list.words, WordIndex(list, NumberAt(value, 0)));
 }
@@ -166,7 +177,8 @@ Text FlashText(const ExifValue& value, std::string& buffer) {
 }
 
 // A word, then each value behind its letter: "Circular area X: 10 Y: 20 R: 5".
-Text LetteredText(const ExifValue& value, std::string_view word, std::string_view letters, std::string& buffer) {
+Text LetteredText(const ExifValue& value, std::string_view word, std::string_view letters,
+                  std::string& buffer) {
   buffer += word;
   for (size_t i = 0; i < letters.size(); ++i) {
     if (!buffer.empty()) buffer += ' ';
@@ -220,7 +232,9 @@ Text GpsTimeText(const ExifValue& value, std::string& buffer) {
   for (uint64_t i = 0; i < 3; ++i) {
     const Rational rational = RationalAt(value, i);
     if (i > 0) buffer += ':';
-    AddTwoDigits(buffer, rational.denominator == 0 ? 0 : static_cast<uint32_t>(rational.numerator / rational.denominator));
+    AddTwoDigits(buffer, rational.denominator == 0
+                             ? 0
+                             : static_cast<uint32_t>(rational.numerator / rational.denominator));
   }
   return buffer;
 }
@@ -228,7 +242,9 @@ Text GpsTimeText(const ExifValue& value, std::string& buffer) {
 // A comment of an unknown code has no line.
 Text CommentText(const ExifValue& value) {
   std::string_view text;
-  if (!DecodeUserComment(value.bytes.Part(0, value.count), value.count, limits.exifValueCharacters, text)) return {};
+  if (!DecodeUserComment(value.bytes.Part(0, value.count), value.count, limits.exifValueCharacters,
+                         text))
+    return {};
   return text;
 }
 
@@ -252,7 +268,8 @@ Text RuleText(const ExifValue& value, const ExifTag& row, std::string& buffer) {
 
 }  // namespace
 
-ExifValue ReadExifValue(std::span<const uint8_t> block, const ExifBytes& numbers, const ExifField& field) {
+ExifValue ReadExifValue(std::span<const uint8_t> block, const ExifBytes& numbers,
+                        const ExifField& field) {
   ExifValue value{field.tag, field.type, field.count, {}};
   uint64_t offset = field.valueOffset, size = field.ValueSize();
   if (field.type == kExifShort && field.count == 0) {
@@ -274,7 +291,8 @@ Text ExifValueText(const ExifValue& value, const ExifTag* row, std::string& buff
   return PlainText(value, row, buffer);
 }
 
-bool DecodeUserComment(std::span<const uint8_t> data, uint32_t count, size_t most, std::string_view& text) {
+bool DecodeUserComment(std::span<const uint8_t> data, uint32_t count, size_t most,
+                       std::string_view& text) {
   text = {};
   if (data.size() < kCodeSize || count < kCodeSize) return false;
   const std::string_view all(reinterpret_cast<const char*>(data.data()), data.size());

@@ -51,8 +51,8 @@ class Walk {
   }
 
  private:
-  // The label of the directory at `offset`, which is moved to the EXIF and then the GPS directory where the chain ends;
-  // empty when all have been walked.
+  // The label of the directory at `offset`, which is moved to the EXIF and then the GPS directory
+  // where the chain ends; empty when all have been walked.
   std::string_view NextLabel(int32_t number, uint32_t& offset, const ExifFindings& findings) {
     if (offset != 0) return label_.Make("IFD ", static_cast<uint32_t>(number));
     if (findings.exifOffset != 0 && !exifWalked_) {
@@ -79,7 +79,8 @@ class Walk {
   // Returns the offset of the next directory.
   uint32_t WalkDirectory(uint64_t offset, uint32_t count, ExifFindings& findings) {
     const uint64_t first = offset + kExifCountSize, end = first + count * kExifEntrySize;
-    for (uint64_t entry = first; entry < std::min(end, numbers_.Size()) && !ended_; entry += kExifEntrySize) {
+    for (uint64_t entry = first; entry < std::min(end, numbers_.Size()) && !ended_;
+         entry += kExifEntrySize) {
       if (entries_++ >= limits.exifEntries) {
         ended_ = true;
         break;
@@ -93,11 +94,12 @@ class Walk {
   }
 
   void NotePointer(const ExifValue& value, uint64_t entry, ExifFindings& findings) const {
-    if (value.tag != kExifPointerTag && value.tag != kGpsPointerTag && value.tag != kThumbnailOffsetTag &&
-        value.tag != kThumbnailSizeTag) {
+    if (value.tag != kExifPointerTag && value.tag != kGpsPointerTag &&
+        value.tag != kThumbnailOffsetTag && value.tag != kThumbnailSizeTag) {
       return;
     }
-    // The 4-byte field itself, whatever the entry's type and count, except for a single SHORT, which is half of it.
+    // The 4-byte field itself, whatever the entry's type and count, except for a single SHORT,
+    // which is half of it.
     const bool half = value.type == kExifShort && value.count == 1;
     const uint32_t number = half ? value.bytes.U16(0) : numbers_.U32(entry + 8);
     switch (value.tag) {
@@ -116,7 +118,8 @@ class Walk {
     const ExifTag* row = FindExifTag(value.tag);
     const auto text = ExifValueText(value, row, buffer_);
     if (!text) return;
-    const std::string_view name = row != nullptr ? row->name : unknown_.Make("Unknown (", value.tag, ")");
+    const std::string_view name =
+        row != nullptr ? row->name : unknown_.Make("Unknown (", value.tag, ")");
     textSize_ += name.size() + text->size() + kLineExtra;
     if (textSize_ > limits.exifTextBytes) {
       ended_ = true;
@@ -141,14 +144,16 @@ class Walk {
 
 }  // namespace
 
-bool WalkExif(std::span<const uint8_t> block, ExifSink* sink, ExifFindings* findings, int32_t only) {
+bool WalkExif(std::span<const uint8_t> block, ExifSink* sink, ExifFindings* findings,
+              int32_t only) {
   ExifFindings found;
   const bool valid = Walk(block, sink, only).Run(found);
   if (findings != nullptr) *findings = found;
   return valid;
 }
 
-std::span<const uint8_t> ExifThumbnail(std::span<const uint8_t> block, const ExifFindings& findings) {
+std::span<const uint8_t> ExifThumbnail(std::span<const uint8_t> block,
+                                       const ExifFindings& findings) {
   const uint64_t offset = findings.thumbnailOffset, size = findings.thumbnailSize;
   if (offset == 0 || offset > block.size() || size > block.size() - offset) return {};
   return block.subspan(offset, size);

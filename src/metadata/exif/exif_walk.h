@@ -8,7 +8,8 @@
 
 namespace fotomill {
 
-// One line of the walk. Everything in it holds only until the sink returns; an editor keeps the value with CopyExifValue.
+// One line of the walk. Everything in it holds only until the sink returns; an editor keeps the
+// value with CopyExifValue.
 struct ExifLine {
   const ExifValue& value;
   std::string_view name;  // of the tag, or "Unknown (50341)"
@@ -32,19 +33,22 @@ inline constexpr int32_t kAllExifDirectories = -1;
 struct ExifFindings {
   uint32_t exifOffset = 0, gpsOffset = 0;           // the first of each that a directory points to
   uint32_t thumbnailOffset = 0, thumbnailSize = 0;  // the last of each
-  bool cutShort = false;                            // a limit ended the walk; the block may hold more
+  // a limit ended the walk; the block may hold more
+  bool cutShort = false;
 };
 
-// Walks an EXIF block: the chain of directories from the header on, then the EXIF and the GPS directory that they point
-// to, each once. A directory without entries, one that was walked before, and the limits on directories, entries and text
-// end the walk. Lines go to `sink` (none without one), those of directory `only` alone when that is a number. False,
-// without any line, when the block does not have the magic number 42.
-// Source: TIFF 6.0, section 2; CIPA DC-008-2012, section 4.6.
+// Walks an EXIF block: the chain of directories from the header on, then the EXIF and the GPS
+// directory that they point to, each once. A directory without entries, one that was walked before,
+// and the limits on directories, entries and text end the walk. Lines go to `sink` (none without
+// one), those of directory `only` alone when that is a number. False, without any line, when the
+// block does not have the magic number 42. Source: TIFF 6.0, section 2; CIPA DC-008-2012,
+// section 4.6.
 bool WalkExif(std::span<const uint8_t> block, ExifSink* sink, ExifFindings* findings = nullptr,
               int32_t only = kAllExifDirectories);
 
-// The embedded thumbnail that a walk found, a JPEG stream, as a part of the block. Empty if there is none or when it
-// is not in the block as a whole.
-std::span<const uint8_t> ExifThumbnail(std::span<const uint8_t> block, const ExifFindings& findings);
+// The embedded thumbnail that a walk found, a JPEG stream, as a part of the block. Empty if there
+// is none or when it is not in the block as a whole.
+std::span<const uint8_t> ExifThumbnail(std::span<const uint8_t> block,
+                                       const ExifFindings& findings);
 
 }  // namespace fotomill

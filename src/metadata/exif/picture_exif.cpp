@@ -25,7 +25,8 @@ Status TurnUpright(PictureRecord& picture) {
 
 void RefreshExif(PictureRecord& picture) {
   if (picture.image.Empty()) return;
-  SetExifPictureFacts(picture.metadata.exif, {.width = picture.image.Width(), .height = picture.image.Height()});
+  SetExifPictureFacts(picture.metadata.exif,
+                      {.width = picture.image.Width(), .height = picture.image.Height()});
 }
 
 }  // namespace fotomill

@@ -16,7 +16,8 @@ constexpr std::string_view kName = "tiff:Orientation";
 
 bool IsBlank(uint8_t c) { return c == ' ' || c == '\t' || c == '\r' || c == '\n'; }
 
-// Where the value behind a name begins: beyond "=" and a quotation mark, or beyond ">"; the packet's end when it does not.
+// Where the value behind a name begins: beyond "=" and a quotation mark, or beyond ">"; the
+// packet's end when it does not.
 size_t ValueBehind(std::span<const uint8_t> packet, size_t at) {
   const auto skipBlanks = [&] {
     while (at < packet.size() && IsBlank(packet[at])) ++at;
@@ -40,7 +41,8 @@ void SetXmpOrientation(std::span<uint8_t> packet, int32_t orientation) {
   while ((rest = std::search(rest, packet.end(), kName.begin(), kName.end())) != packet.end()) {
     rest += kName.size();
     const size_t value = ValueBehind(packet, static_cast<size_t>(rest - packet.begin()));
-    const bool oneDigit = value + 1 < packet.size() && packet[value] >= '1' && packet[value] <= '8' &&
+    const bool oneDigit = value + 1 < packet.size() && packet[value] >= '1' &&
+                          packet[value] <= '8' &&
                           (packet[value + 1] < '0' || packet[value + 1] > '9');
     if (oneDigit) packet[value] = static_cast<uint8_t>('0' + orientation);
   }

@@ -5,8 +5,8 @@
 
 namespace fotomill {
 
-// Sets every orientation of a picture (tiff:Orientation, 1 to 8) that an XMP packet tells, as an attribute or as an element,
-// in place. Adds none.
+// Sets every orientation of a picture (tiff:Orientation, 1 to 8) that an XMP packet tells, as an
+// attribute or as an element, in place. Adds none.
 void SetXmpOrientation(std::span<uint8_t> packet, int32_t orientation);
 
 }  // namespace fotomill

@@ -24,7 +24,8 @@ constexpr Parameter kCrop[] = {
 
 Status Crop(PictureRecord& picture, const Arguments& arguments, const OperationContext&) {
   const Size whole{picture.image.Width(), picture.image.Height()};
-  return CutPicture(picture, AreaOf(arguments.Of("area"), whole, picture.metadata, arguments.Choice<Gravity>("gravity")));
+  return CutPicture(picture, AreaOf(arguments.Of("area"), whole, picture.metadata,
+                                    arguments.Choice<Gravity>("gravity")));
 }
 
 constexpr Parameter kTrim[] = {
@@ -38,7 +39,8 @@ Status Trim(PictureRecord& picture, const Arguments& arguments, const OperationC
   Rectangle content;
   RETURN_IF_BAD(FindContent(picture, arguments.Integer("fuzz"), content));
   const int32_t margin = arguments.Integer("margin");
-  return CutPicture(picture, {content.x - margin, content.y - margin, content.width + 2 * margin, content.height + 2 * margin});
+  return CutPicture(picture, {content.x - margin, content.y - margin, content.width + 2 * margin,
+                              content.height + 2 * margin});
 }
 
 constexpr Parameter kCanvas[] = {
@@ -50,27 +52,48 @@ constexpr Parameter kCanvas[] = {
      .key = "AlphaBackground"},
 };
 
-int32_t Whole(double pixels) { return static_cast<int32_t>(std::floor(std::clamp(pixels, 1.0, 1e9) + 0.5)); }
+int32_t Whole(double pixels) {
+  return static_cast<int32_t>(std::floor(std::clamp(pixels, 1.0, 1e9) + 0.5));
+}
 
 Status Canvas(PictureRecord& picture, const Arguments& arguments, const OperationContext&) {
   const Value& wanted = arguments.Of("size");
   const Size own{picture.image.Width(), picture.image.Height()};
   const Length& height = wanted.longestEdge ? wanted.width : wanted.height;
   Size size = own;
-  if (wanted.hasWidth || wanted.longestEdge) size.width = Whole(wanted.width.Pixels(own.width, picture.metadata.dpiX));
-  if (wanted.hasHeight || wanted.longestEdge) size.height = Whole(height.Pixels(own.height, picture.metadata.dpiY));
+  if (wanted.hasWidth || wanted.longestEdge)
+    size.width = Whole(wanted.width.Pixels(own.width, picture.metadata.dpiX));
+  if (wanted.hasHeight || wanted.longestEdge)
+    size.height = Whole(height.Pixels(own.height, picture.metadata.dpiY));
   const Rectangle place = PlaceWithin(size, own, arguments.Choice<Gravity>("gravity"));
   return PlaceOnCanvas(picture, size, place.x, place.y, BackdropOf(arguments.Color("background")));
 }
 
 constexpr Operation kOperations[] = {
-    {.name = "crop", .family = Family::Crop, .label = "Crop", .help = "Keeps a part of the picture and cuts off the rest.",
-     .example = "crop 3:2 gravity=top", .parameters = kCrop, .works = Works::Geometry, .apply = Crop},
-    {.name = "trim", .family = Family::Crop, .label = "Trim", .help = "Cuts off a border of one color.", .example = "trim 10 margin=2",
-     .parameters = kTrim, .works = Works::Geometry, .apply = Trim},
-    {.name = "canvas", .family = Family::Crop, .label = "Canvas",
-     .help = "Puts the picture onto a larger or smaller canvas without scaling it.", .example = "canvas 200x200 gravity=top background=gray",
-     .parameters = kCanvas, .works = Works::Geometry, .apply = Canvas},
+    {.name = "crop",
+     .family = Family::Crop,
+     .label = "Crop",
+     .help = "Keeps a part of the picture and cuts off the rest.",
+     .example = "crop 3:2 gravity=top",
+     .parameters = kCrop,
+     .works = Works::Geometry,
+     .apply = Crop},
+    {.name = "trim",
+     .family = Family::Crop,
+     .label = "Trim",
+     .help = "Cuts off a border of one color.",
+     .example = "trim 10 margin=2",
+     .parameters = kTrim,
+     .works = Works::Geometry,
+     .apply = Trim},
+    {.name = "canvas",
+     .family = Family::Crop,
+     .label = "Canvas",
+     .help = "Puts the picture onto a larger or smaller canvas without scaling it.",
+     .example = "canvas 200x200 gravity=top background=gray",
+     .parameters = kCanvas,
+     .works = Works::Geometry,
+     .apply = Canvas},
 };
 
 }  // namespace

@@ -12,7 +12,12 @@ namespace {
 
 using enum ParameterKind;
 
-constexpr Parameter kSeed = {.name = "seed", .kind = kInteger, .preset = "1", .least = 0, .most = 2147483647, .label = "Seed",
+constexpr Parameter kSeed = {.name = "seed",
+                             .kind = kInteger,
+                             .preset = "1",
+                             .least = 0,
+                             .most = 2147483647,
+                             .label = "Seed",
                              .help = "Another number gives another pattern."};
 constexpr Parameter kNoise[] = {
     {.name = "kind", .kind = kChoice, .preset = "gaussian", .choices = "uniform|gaussian|salt-pepper", .label = "Kind",
@@ -24,8 +29,13 @@ constexpr Parameter kNoise[] = {
 };
 
 Status Noise(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
-  return AddNoise(picture, {.kind = arguments.Choice<NoiseKind>("kind"), .amount = arguments.Number("amount"), .gray = arguments.Flag("gray"),
-                            .seed = static_cast<uint32_t>(arguments.Integer("seed")), .left = context.left, .top = context.top},
+  return AddNoise(picture,
+                  {.kind = arguments.Choice<NoiseKind>("kind"),
+                   .amount = arguments.Number("amount"),
+                   .gray = arguments.Flag("gray"),
+                   .seed = static_cast<uint32_t>(arguments.Integer("seed")),
+                   .left = context.left,
+                   .top = context.top},
                   context.work);
 }
 int32_t NoReach(const Arguments&) { return 0; }
@@ -36,23 +46,48 @@ constexpr Parameter kSpread[] = {
 };
 
 Status Spread(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
-  return SpreadPicture(picture, arguments.Integer("radius"), static_cast<uint32_t>(arguments.Integer("seed")), context.left, context.top,
+  return SpreadPicture(picture, arguments.Integer("radius"),
+                       static_cast<uint32_t>(arguments.Integer("seed")), context.left, context.top,
                        context.work);
 }
 int32_t ReachOfSpread(const Arguments& arguments) { return arguments.Integer("radius"); }
 
-constexpr Parameter kAmplitude = {.name = "amplitude", .kind = kNumber, .unit = "px", .preset = "10", .least = -1000, .most = 1000,
-                                  .label = "Amplitude", .help = "How far pixels move."};
-constexpr Parameter kWavelength = {.name = "wavelength", .kind = kNumber, .unit = "px", .preset = "50", .least = 1, .most = 100000,
-                                   .label = "Wavelength", .help = "From crest to crest."};
-constexpr Parameter kCenter = {.name = "center", .kind = kPoint, .unit = "px", .preset = "50%,50%", .label = "Center",
+constexpr Parameter kAmplitude = {.name = "amplitude",
+                                  .kind = kNumber,
+                                  .unit = "px",
+                                  .preset = "10",
+                                  .least = -1000,
+                                  .most = 1000,
+                                  .label = "Amplitude",
+                                  .help = "How far pixels move."};
+constexpr Parameter kWavelength = {.name = "wavelength",
+                                   .kind = kNumber,
+                                   .unit = "px",
+                                   .preset = "50",
+                                   .least = 1,
+                                   .most = 100000,
+                                   .label = "Wavelength",
+                                   .help = "From crest to crest."};
+constexpr Parameter kCenter = {.name = "center",
+                               .kind = kPoint,
+                               .unit = "px",
+                               .preset = "50%,50%",
+                               .label = "Center",
                                .help = "The middle of it."};
-constexpr Parameter kRadius = {.name = "radius", .kind = kLength, .unit = "px", .preset = "50%", .least = 0.001, .most = 1e9,
-                               .label = "Radius", .help = "How far it reaches; percent are of the shorter edge."};
+constexpr Parameter kRadius = {.name = "radius",
+                               .kind = kLength,
+                               .unit = "px",
+                               .preset = "50%",
+                               .least = 0.001,
+                               .most = 1e9,
+                               .label = "Radius",
+                               .help = "How far it reaches; percent are of the shorter edge."};
 
-AreaPoint CenterOf(const PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+AreaPoint CenterOf(const PictureRecord& picture, const Arguments& arguments,
+                   const OperationContext& context) {
   const Size own{picture.image.Width(), picture.image.Height()};
-  return PointOf(arguments.Of("center"), context.whole.width > 0 ? context.whole : own, picture.metadata);
+  return PointOf(arguments.Of("center"), context.whole.width > 0 ? context.whole : own,
+                 picture.metadata);
 }
 
 double RadiusOf(const PictureRecord& picture, const Arguments& arguments) {
@@ -66,8 +101,8 @@ constexpr Parameter kRipple[] = {kAmplitude, kWavelength, kCenter};
 
 Status Ripple(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
   const AreaPoint center = CenterOf(picture, arguments, context);
-  return RipplePicture(picture, arguments.Number("amplitude"), arguments.Number("wavelength"), center.x, center.y,
-                       {context.left, context.top}, context.work);
+  return RipplePicture(picture, arguments.Number("amplitude"), arguments.Number("wavelength"),
+                       center.x, center.y, {context.left, context.top}, context.work);
 }
 
 constexpr Parameter kWave[] = {
@@ -77,8 +112,8 @@ constexpr Parameter kWave[] = {
 };
 
 Status Wave(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
-  return WavePicture(picture, arguments.Number("amplitude"), arguments.Number("wavelength"), arguments.Choice("direction") == 0,
-                     {context.left, context.top}, context.work);
+  return WavePicture(picture, arguments.Number("amplitude"), arguments.Number("wavelength"),
+                     arguments.Choice("direction") == 0, {context.left, context.top}, context.work);
 }
 
 constexpr Parameter kSwirl[] = {
@@ -89,7 +124,8 @@ constexpr Parameter kSwirl[] = {
 
 Status Swirl(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
   const AreaPoint center = CenterOf(picture, arguments, context);
-  return SwirlPicture(picture, arguments.Number("angle"), center.x, center.y, RadiusOf(picture, arguments), context.work);
+  return SwirlPicture(picture, arguments.Number("angle"), center.x, center.y,
+                      RadiusOf(picture, arguments), context.work);
 }
 
 constexpr Parameter kBulge[] = {
@@ -100,22 +136,63 @@ constexpr Parameter kBulge[] = {
 
 Status Bulge(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
   const AreaPoint center = CenterOf(picture, arguments, context);
-  return BulgePicture(picture, arguments.Number("amount") / 100, center.x, center.y, RadiusOf(picture, arguments), context.work);
+  return BulgePicture(picture, arguments.Number("amount") / 100, center.x, center.y,
+                      RadiusOf(picture, arguments), context.work);
 }
 
 constexpr Operation kOperations[] = {
-    {.name = "noise", .family = Family::Filter, .label = "Noise", .help = "Adds noise.", .example = "noise gaussian 5%",
-     .parameters = kNoise, .works = Works::Neighborhood, .apply = Noise, .reach = NoReach},
-    {.name = "spread", .family = Family::Filter, .label = "Spread", .help = "Takes pixels from near places at random, as frosted glass does.",
-     .example = "spread 4", .parameters = kSpread, .works = Works::Neighborhood, .apply = Spread, .reach = ReachOfSpread},
-    {.name = "ripple", .family = Family::Filter, .label = "Ripple", .help = "Rings on water.", .example = "ripple 3 20",
-     .parameters = kRipple, .works = Works::Neighborhood, .apply = Ripple, .reach = ReachOfWave},
-    {.name = "wave", .family = Family::Filter, .label = "Wave", .help = "Lets columns or rows swing.", .example = "wave 4 30",
-     .parameters = kWave, .works = Works::Neighborhood, .apply = Wave, .reach = ReachOfWave},
-    {.name = "swirl", .family = Family::Filter, .label = "Swirl", .help = "Turns the picture around a center, less further out.",
-     .example = "swirl 120", .parameters = kSwirl, .works = Works::WholePicture, .apply = Swirl},
-    {.name = "bulge", .family = Family::Filter, .label = "Bulge", .help = "Enlarges or shrinks the center as a lens does.",
-     .example = "bulge -40%", .parameters = kBulge, .works = Works::WholePicture, .apply = Bulge},
+    {.name = "noise",
+     .family = Family::Filter,
+     .label = "Noise",
+     .help = "Adds noise.",
+     .example = "noise gaussian 5%",
+     .parameters = kNoise,
+     .works = Works::Neighborhood,
+     .apply = Noise,
+     .reach = NoReach},
+    {.name = "spread",
+     .family = Family::Filter,
+     .label = "Spread",
+     .help = "Takes pixels from near places at random, as frosted glass does.",
+     .example = "spread 4",
+     .parameters = kSpread,
+     .works = Works::Neighborhood,
+     .apply = Spread,
+     .reach = ReachOfSpread},
+    {.name = "ripple",
+     .family = Family::Filter,
+     .label = "Ripple",
+     .help = "Rings on water.",
+     .example = "ripple 3 20",
+     .parameters = kRipple,
+     .works = Works::Neighborhood,
+     .apply = Ripple,
+     .reach = ReachOfWave},
+    {.name = "wave",
+     .family = Family::Filter,
+     .label = "Wave",
+     .help = "Lets columns or rows swing.",
+     .example = "wave 4 30",
+     .parameters = kWave,
+     .works = Works::Neighborhood,
+     .apply = Wave,
+     .reach = ReachOfWave},
+    {.name = "swirl",
+     .family = Family::Filter,
+     .label = "Swirl",
+     .help = "Turns the picture around a center, less further out.",
+     .example = "swirl 120",
+     .parameters = kSwirl,
+     .works = Works::WholePicture,
+     .apply = Swirl},
+    {.name = "bulge",
+     .family = Family::Filter,
+     .label = "Bulge",
+     .help = "Enlarges or shrinks the center as a lens does.",
+     .example = "bulge -40%",
+     .parameters = kBulge,
+     .works = Works::WholePicture,
+     .apply = Bulge},
 };
 
 }  // namespace

@@ -97,12 +97,25 @@ constexpr Parameter kColorize[] = {
     {.name = "light", .kind = kColor, .preset = "#ffffff", .label = "Light", .help = "What white becomes."},
 };
 constexpr Parameter kChannels[] = {
-    {.name = "keep", .kind = kChoice, .preset = "", .choices = "red|green|blue|alpha", .label = "Keep",
+    {.name = "keep",
+     .kind = kChoice,
+     .preset = "",
+     .choices = "red|green|blue|alpha",
+     .label = "Keep",
      .help = "Shows one channel in gray; alpha is taken off the picture then."},
-    {.name = "swap", .kind = kChoice, .preset = "", .choices = "red-green|red-blue|green-blue", .label = "Swap",
+    {.name = "swap",
+     .kind = kChoice,
+     .preset = "",
+     .choices = "red-green|red-blue|green-blue",
+     .label = "Swap",
      .help = "Exchanges two channels."},
-    {.name = "mix", .kind = kText, .preset = "", .most = 200, .label = "Mix",
-     .help = "Nine percentages: shares of red, green and blue in the new red, then in green, then in blue."},
+    {.name = "mix",
+     .kind = kText,
+     .preset = "",
+     .most = 200,
+     .label = "Mix",
+     .help = "Nine percentages: shares of red, green and blue in the new red, then in green, then "
+             "in blue."},
 };
 constexpr Parameter kVignette[] = {
     {.name = "amount", .kind = kPercent, .unit = "%", .preset = "50", .least = 0, .most = 100, .label = "Amount",
@@ -112,18 +125,38 @@ constexpr Parameter kVignette[] = {
     {.name = "color", .kind = kColor, .preset = "#000000", .label = "Color", .help = "What the edges fade into."},
 };
 
-void Brightness(const Arguments& arguments, PointEffect& effect) { effect = BrightnessEffect(arguments.Number("b")); }
-void Contrast(const Arguments& arguments, PointEffect& effect) { effect = ContrastEffect(arguments.Number("c")); }
-void Gamma(const Arguments& arguments, PointEffect& effect) { effect = GammaEffect(arguments.Number("g")); }
+void Brightness(const Arguments& arguments, PointEffect& effect) {
+  effect = BrightnessEffect(arguments.Number("b"));
+}
+void Contrast(const Arguments& arguments, PointEffect& effect) {
+  effect = ContrastEffect(arguments.Number("c"));
+}
+void Gamma(const Arguments& arguments, PointEffect& effect) {
+  effect = GammaEffect(arguments.Number("g"));
+}
 void Invert(const Arguments&, PointEffect& effect) { effect = InvertEffect(); }
 void Gray(const Arguments&, PointEffect& effect) { effect = GrayEffect(); }
-void Saturation(const Arguments& arguments, PointEffect& effect) { effect = SaturationEffect(arguments.Number("s") / 100); }
-void Hue(const Arguments& arguments, PointEffect& effect) { effect = HueEffect(arguments.Number("angle")); }
-void Temperature(const Arguments& arguments, PointEffect& effect) { effect = TemperatureEffect(arguments.Number("t")); }
-void Sepia(const Arguments& arguments, PointEffect& effect) { effect = SepiaEffect(arguments.Number("amount") / 100); }
-void Threshold(const Arguments& arguments, PointEffect& effect) { effect = ThresholdEffect(arguments.Integer("t")); }
-void Posterize(const Arguments& arguments, PointEffect& effect) { effect = PosterizeEffect(arguments.Integer("n")); }
-void Solarize(const Arguments& arguments, PointEffect& effect) { effect = SolarizeEffect(arguments.Number("t")); }
+void Saturation(const Arguments& arguments, PointEffect& effect) {
+  effect = SaturationEffect(arguments.Number("s") / 100);
+}
+void Hue(const Arguments& arguments, PointEffect& effect) {
+  effect = HueEffect(arguments.Number("angle"));
+}
+void Temperature(const Arguments& arguments, PointEffect& effect) {
+  effect = TemperatureEffect(arguments.Number("t"));
+}
+void Sepia(const Arguments& arguments, PointEffect& effect) {
+  effect = SepiaEffect(arguments.Number("amount") / 100);
+}
+void Threshold(const Arguments& arguments, PointEffect& effect) {
+  effect = ThresholdEffect(arguments.Integer("t"));
+}
+void Posterize(const Arguments& arguments, PointEffect& effect) {
+  effect = PosterizeEffect(arguments.Integer("n"));
+}
+void Solarize(const Arguments& arguments, PointEffect& effect) {
+  effect = SolarizeEffect(arguments.Number("t"));
+}
 
 void LevelsOf(const Arguments& arguments, PointEffect& effect) {
   effect = LevelsEffect({.black = arguments.Number("black"),
@@ -148,7 +181,8 @@ void Curves(const Arguments& arguments, PointEffect& effect) {
 ArgumentProblem CheckOpaque(const Arguments& arguments) {
   for (size_t i = 0; i < arguments.Rows().size(); ++i) {
     const Parameter& row = arguments.Rows()[i];
-    if (row.kind == kColor && arguments.At(i).color.alpha < 255) return {row.name, "must be a color without transparency"};
+    if (row.kind == kColor && arguments.At(i).color.alpha < 255)
+      return {row.name, "must be a color without transparency"};
   }
   return {};
 }
@@ -160,25 +194,29 @@ void Tint(const Arguments& arguments, PointEffect& effect) {
 }
 
 void Colorize(const Arguments& arguments, PointEffect& effect) {
-  effect = ColorizeEffect(BgrOf(arguments.Color("color")), BgrOf(arguments.Color("dark")), BgrOf(arguments.Color("light")));
+  effect = ColorizeEffect(BgrOf(arguments.Color("color")), BgrOf(arguments.Color("dark")),
+                          BgrOf(arguments.Color("light")));
 }
 
 enum class Mode : int32_t { Each, Together };
 
-Status CountForMode(const PictureRecord& picture, const Arguments& arguments, const Work& work, LevelCounts& counts) {
+Status CountForMode(const PictureRecord& picture, const Arguments& arguments, const Work& work,
+                    LevelCounts& counts) {
   RETURN_IF_BAD(CountLevels(picture, work, counts));
   if (arguments.Choice<Mode>("mode") == Mode::Together) counts = TogetherCounts(counts);
   return Status::Ok;
 }
 
-Status AutoLevels(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+Status AutoLevels(PictureRecord& picture, const Arguments& arguments,
+                  const OperationContext& context) {
   LevelCounts counts;
   RETURN_IF_BAD(CountForMode(picture, arguments, context.work, counts));
   const PointEffect effect = StretchEffect(counts, arguments.Number("clip"));
   return ApplyPointEffects(picture, std::span(&effect, 1), context.work);
 }
 
-Status Equalize(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+Status Equalize(PictureRecord& picture, const Arguments& arguments,
+                const OperationContext& context) {
   LevelCounts counts;
   RETURN_IF_BAD(CountForMode(picture, arguments, context.work, counts));
   const PointEffect effect = EqualizeEffect(counts);
@@ -196,10 +234,12 @@ std::optional<MixMatrix> ReadMix(std::string_view text) {
       continue;
     }
     double number = 0;
-    const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number, std::chars_format::fixed);
+    const auto [end, error] =
+        std::from_chars(text.data(), text.data() + text.size(), number, std::chars_format::fixed);
     text.remove_prefix(static_cast<size_t>(end - text.data()));
     const bool ends = text.empty() || isGap(text[0]);
-    if (error != std::errc() || !ends || !(std::abs(number) <= 200) || count == 9) return std::nullopt;
+    if (error != std::errc() || !ends || !(std::abs(number) <= 200) || count == 9)
+      return std::nullopt;
     matrix[count / 3][count % 3] = number / 100;
     ++count;
   }
@@ -220,14 +260,16 @@ Status KeepAlpha(PictureRecord& picture) {
   for (int32_t y = 0; y < picture.image.Height(); ++y) {
     uint8_t* bgr = picture.image.Row(y).data();
     const uint8_t* alpha = picture.alpha.Empty() ? nullptr : picture.alpha.Row(y).data();
-    for (int32_t x = 0; x < width; ++x, bgr += 3) std::memset(bgr, alpha != nullptr ? alpha[x] : 255, 3);
+    for (int32_t x = 0; x < width; ++x, bgr += 3)
+      std::memset(bgr, alpha != nullptr ? alpha[x] : 255, 3);
   }
   picture.alpha.Free();
   picture.alphaFlags &= static_cast<uint8_t>(~kHasAlpha);
   return Status::Ok;
 }
 
-Status Channels(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+Status Channels(PictureRecord& picture, const Arguments& arguments,
+                const OperationContext& context) {
   constexpr int32_t kAlpha = 3;
   if (picture.image.Empty()) return Status::EmptyImage;
   if (arguments.Has("keep") && arguments.Choice("keep") == kAlpha) return KeepAlpha(picture);
@@ -245,7 +287,8 @@ Status Channels(PictureRecord& picture, const Arguments& arguments, const Operat
 // Looks at no neighbors, but a part of a picture tells its place.
 int32_t NoReach(const Arguments&) { return 0; }
 
-Status Vignetted(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+Status Vignetted(PictureRecord& picture, const Arguments& arguments,
+                 const OperationContext& context) {
   return ApplyVignette(picture,
                        {.amount = arguments.Number("amount") / 100,
                         .size = arguments.Number("size") / 100,
@@ -257,47 +300,172 @@ Status Vignetted(PictureRecord& picture, const Arguments& arguments, const Opera
 }
 
 constexpr Operation kEffects[] = {
-    {.name = "brightness", .family = Family::Effects, .label = "Brightness", .help = "Makes a picture brighter or darker.",
-     .example = "brightness 10", .parameters = kBrightness, .works = Works::Point, .point = Brightness},
-    {.name = "contrast", .family = Family::Effects, .label = "Contrast", .help = "Raises or lowers the contrast.",
-     .example = "contrast 15", .parameters = kContrast, .works = Works::Point, .point = Contrast},
-    {.name = "gamma", .family = Family::Effects, .label = "Gamma", .help = "Brightens or darkens midtones; black and white stay.",
-     .example = "gamma 1.2", .parameters = kGamma, .works = Works::Point, .point = Gamma},
-    {.name = "levels", .family = Family::Effects, .label = "Levels", .help = "Sets which levels become black and white.",
-     .example = "levels 10 240 gamma=1.1", .parameters = kLevels, .works = Works::Point, .point = LevelsOf, .check = CheckLevels},
-    {.name = "curves", .family = Family::Effects, .label = "Curves", .help = "Changes levels by a smooth curve through points.",
-     .example = "curves \"0,0 64,50 192,210 255,255\"", .parameters = kCurves, .works = Works::Point, .point = Curves},
-    {.name = "auto-levels", .family = Family::Effects, .label = "Auto levels", .help = "Spreads the levels from black to white.",
-     .example = "auto-levels", .parameters = kAutoLevels, .works = Works::WholePicture, .apply = AutoLevels},
-    {.name = "equalize", .family = Family::Effects, .label = "Equalize", .help = "Makes all levels about equally frequent.",
-     .example = "equalize", .parameters = kEqualize, .works = Works::WholePicture, .apply = Equalize},
-    {.name = "saturation", .family = Family::Effects, .label = "Saturation", .help = "Makes colors stronger or weaker.",
-     .example = "saturation 130", .parameters = kSaturation, .works = Works::Point, .point = Saturation},
-    {.name = "hue", .family = Family::Effects, .label = "Hue", .help = "Rotates all hues on the color wheel.",
-     .example = "hue 30", .parameters = kHue, .works = Works::Point, .point = Hue},
-    {.name = "temperature", .family = Family::Effects, .label = "Temperature", .help = "Makes the light of a picture warmer or colder.",
-     .example = "temperature 20", .parameters = kTemperature, .works = Works::Point, .point = Temperature},
-    {.name = "tint", .family = Family::Effects, .label = "Tint", .help = "Mixes a color into all others.",
-     .example = "tint #ff8800 20%", .parameters = kTint, .works = Works::Point, .point = Tint, .check = CheckOpaque},
-    {.name = "invert", .family = Family::Effects, .label = "Invert", .help = "Turns a picture into its negative.",
-     .example = "invert", .parameters = {}, .works = Works::Point, .point = Invert},
-    {.name = "gray", .family = Family::Effects, .label = "Gray", .help = "Replaces colors by their brightness.",
-     .example = "gray", .parameters = {}, .works = Works::Point, .point = Gray},
-    {.name = "sepia", .family = Family::Effects, .label = "Sepia", .help = "Gives a picture the brown of old photographs.",
-     .example = "sepia", .parameters = kSepia, .works = Works::Point, .point = Sepia},
-    {.name = "threshold", .family = Family::Effects, .label = "Threshold", .help = "Makes bright pixels white and dark ones black.",
-     .example = "threshold 110", .parameters = kThreshold, .works = Works::Point, .point = Threshold},
-    {.name = "posterize", .family = Family::Effects, .label = "Posterize", .help = "Leaves a few levels of each channel.",
-     .example = "posterize 5", .parameters = kPosterize, .works = Works::Point, .point = Posterize},
-    {.name = "solarize", .family = Family::Effects, .label = "Solarize", .help = "Inverts bright levels.",
-     .example = "solarize 140", .parameters = kSolarize, .works = Works::Point, .point = Solarize},
-    {.name = "colorize", .family = Family::Effects, .label = "Colorize", .help = "Replaces all colors by shades of one.",
-     .example = "colorize #4070a0", .parameters = kColorize, .works = Works::Point, .point = Colorize, .check = CheckOpaque},
-    {.name = "channels", .family = Family::Effects, .label = "Channels", .help = "Keeps, exchanges or mixes color channels.",
-     .example = "channels swap=red-blue", .parameters = kChannels, .works = Works::Neighborhood, .apply = Channels,
-     .reach = NoReach, .check = CheckChannels},
-    {.name = "vignette", .family = Family::Effects, .label = "Vignette", .help = "Darkens the edges of a picture, or fades them into a color.",
-     .example = "vignette 60", .parameters = kVignette, .works = Works::Neighborhood, .apply = Vignetted, .reach = NoReach,
+    {.name = "brightness",
+     .family = Family::Effects,
+     .label = "Brightness",
+     .help = "Makes a picture brighter or darker.",
+     .example = "brightness 10",
+     .parameters = kBrightness,
+     .works = Works::Point,
+     .point = Brightness},
+    {.name = "contrast",
+     .family = Family::Effects,
+     .label = "Contrast",
+     .help = "Raises or lowers the contrast.",
+     .example = "contrast 15",
+     .parameters = kContrast,
+     .works = Works::Point,
+     .point = Contrast},
+    {.name = "gamma",
+     .family = Family::Effects,
+     .label = "Gamma",
+     .help = "Brightens or darkens midtones; black and white stay.",
+     .example = "gamma 1.2",
+     .parameters = kGamma,
+     .works = Works::Point,
+     .point = Gamma},
+    {.name = "levels",
+     .family = Family::Effects,
+     .label = "Levels",
+     .help = "Sets which levels become black and white.",
+     .example = "levels 10 240 gamma=1.1",
+     .parameters = kLevels,
+     .works = Works::Point,
+     .point = LevelsOf,
+     .check = CheckLevels},
+    {.name = "curves",
+     .family = Family::Effects,
+     .label = "Curves",
+     .help = "Changes levels by a smooth curve through points.",
+     .example = "curves \"0,0 64,50 192,210 255,255\"",
+     .parameters = kCurves,
+     .works = Works::Point,
+     .point = Curves},
+    {.name = "auto-levels",
+     .family = Family::Effects,
+     .label = "Auto levels",
+     .help = "Spreads the levels from black to white.",
+     .example = "auto-levels",
+     .parameters = kAutoLevels,
+     .works = Works::WholePicture,
+     .apply = AutoLevels},
+    {.name = "equalize",
+     .family = Family::Effects,
+     .label = "Equalize",
+     .help = "Makes all levels about equally frequent.",
+     .example = "equalize",
+     .parameters = kEqualize,
+     .works = Works::WholePicture,
+     .apply = Equalize},
+    {.name = "saturation",
+     .family = Family::Effects,
+     .label = "Saturation",
+     .help = "Makes colors stronger or weaker.",
+     .example = "saturation 130",
+     .parameters = kSaturation,
+     .works = Works::Point,
+     .point = Saturation},
+    {.name = "hue",
+     .family = Family::Effects,
+     .label = "Hue",
+     .help = "Rotates all hues on the color wheel.",
+     .example = "hue 30",
+     .parameters = kHue,
+     .works = Works::Point,
+     .point = Hue},
+    {.name = "temperature",
+     .family = Family::Effects,
+     .label = "Temperature",
+     .help = "Makes the light of a picture warmer or colder.",
+     .example = "temperature 20",
+     .parameters = kTemperature,
+     .works = Works::Point,
+     .point = Temperature},
+    {.name = "tint",
+     .family = Family::Effects,
+     .label = "Tint",
+     .help = "Mixes a color into all others.",
+     .example = "tint #ff8800 20%",
+     .parameters = kTint,
+     .works = Works::Point,
+     .point = Tint,
+     .check = CheckOpaque},
+    {.name = "invert",
+     .family = Family::Effects,
+     .label = "Invert",
+     .help = "Turns a picture into its negative.",
+     .example = "invert",
+     .parameters = {},
+     .works = Works::Point,
+     .point = Invert},
+    {.name = "gray",
+     .family = Family::Effects,
+     .label = "Gray",
+     .help = "Replaces colors by their brightness.",
+     .example = "gray",
+     .parameters = {},
+     .works = Works::Point,
+     .point = Gray},
+    {.name = "sepia",
+     .family = Family::Effects,
+     .label = "Sepia",
+     .help = "Gives a picture the brown of old photographs.",
+     .example = "sepia",
+     .parameters = kSepia,
+     .works = Works::Point,
+     .point = Sepia},
+    {.name = "threshold",
+     .family = Family::Effects,
+     .label = "Threshold",
+     .help = "Makes bright pixels white and dark ones black.",
+     .example = "threshold 110",
+     .parameters = kThreshold,
+     .works = Works::Point,
+     .point = Threshold},
+    {.name = "posterize",
+     .family = Family::Effects,
+     .label = "Posterize",
+     .help = "Leaves a few levels of each channel.",
+     .example = "posterize 5",
+     .parameters = kPosterize,
+     .works = Works::Point,
+     .point = Posterize},
+    {.name = "solarize",
+     .family = Family::Effects,
+     .label = "Solarize",
+     .help = "Inverts bright levels.",
+     .example = "solarize 140",
+     .parameters = kSolarize,
+     .works = Works::Point,
+     .point = Solarize},
+    {.name = "colorize",
+     .family = Family::Effects,
+     .label = "Colorize",
+     .help = "Replaces all colors by shades of one.",
+     .example = "colorize #4070a0",
+     .parameters = kColorize,
+     .works = Works::Point,
+     .point = Colorize,
+     .check = CheckOpaque},
+    {.name = "channels",
+     .family = Family::Effects,
+     .label = "Channels",
+     .help = "Keeps, exchanges or mixes color channels.",
+     .example = "channels swap=red-blue",
+     .parameters = kChannels,
+     .works = Works::Neighborhood,
+     .apply = Channels,
+     .reach = NoReach,
+     .check = CheckChannels},
+    {.name = "vignette",
+     .family = Family::Effects,
+     .label = "Vignette",
+     .help = "Darkens the edges of a picture, or fades them into a color.",
+     .example = "vignette 60",
+     .parameters = kVignette,
+     .works = Works::Neighborhood,
+     .apply = Vignetted,
+     .reach = NoReach,
      .check = CheckOpaque},
 };
 

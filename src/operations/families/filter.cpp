@@ -20,8 +20,14 @@ namespace {
 
 using enum ParameterKind;
 
-constexpr Parameter kSigma = {.name = "sigma", .kind = kNumber, .unit = "px", .preset = "1", .least = 0.1, .most = 1000,
-                              .label = "Sigma", .help = "Standard deviation of the Gaussian."};
+constexpr Parameter kSigma = {.name = "sigma",
+                              .kind = kNumber,
+                              .unit = "px",
+                              .preset = "1",
+                              .least = 0.1,
+                              .most = 1000,
+                              .label = "Sigma",
+                              .help = "Standard deviation of the Gaussian."};
 constexpr Parameter kBlur[] = {kSigma};
 constexpr Parameter kUnsharp[] = {
     kSigma,
@@ -37,27 +43,37 @@ int32_t Reach(const Arguments& arguments) { return GaussianReach(arguments.Numbe
 Status Blur(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
   return BlurPicture(picture, arguments.Number("sigma"), PlaceOf(context), context.work);
 }
-Status Sharpen(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+Status Sharpen(PictureRecord& picture, const Arguments& arguments,
+               const OperationContext& context) {
   return UnsharpPicture(picture, arguments.Number("sigma"), 1, 0, PlaceOf(context), context.work);
 }
-Status Unsharp(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
-  return UnsharpPicture(picture, arguments.Number("sigma"), arguments.Number("amount"), arguments.Number("threshold"),
-                        PlaceOf(context), context.work);
+Status Unsharp(PictureRecord& picture, const Arguments& arguments,
+               const OperationContext& context) {
+  return UnsharpPicture(picture, arguments.Number("sigma"), arguments.Number("amount"),
+                        arguments.Number("threshold"), PlaceOf(context), context.work);
 }
 
-constexpr Parameter kRadius = {.name = "radius", .kind = kInteger, .unit = "px", .preset = "1", .least = 0,
-                               .most = kMostRankRadius, .label = "Radius",
-                               .help = "A square of twice as many pixels and one more on each side counts."};
+constexpr Parameter kRadius = {
+    .name = "radius",
+    .kind = kInteger,
+    .unit = "px",
+    .preset = "1",
+    .least = 0,
+    .most = kMostRankRadius,
+    .label = "Radius",
+    .help = "A square of twice as many pixels and one more on each side counts."};
 constexpr Parameter kWindow[] = {kRadius};
 static_assert(kMostBoxRadius >= kMostRankRadius);
 
 int32_t Radius(const Arguments& arguments) { return arguments.Integer("radius"); }
 
-Status BoxBlur(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+Status BoxBlur(PictureRecord& picture, const Arguments& arguments,
+               const OperationContext& context) {
   return BoxBlurPicture(picture, Radius(arguments), context.work);
 }
 template <Rank rank>
-Status ApplyRank(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+Status ApplyRank(PictureRecord& picture, const Arguments& arguments,
+                 const OperationContext& context) {
   return RankPicture(picture, rank, Radius(arguments), context.work);
 }
 
@@ -67,10 +83,14 @@ constexpr Parameter kMotion[] = {
      .help = "The direction; 0 is to the right."},
 };
 
-Status MotionBlur(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
-  return MotionBlurPicture(picture, arguments.Number("length"), arguments.Number("angle"), context.work);
+Status MotionBlur(PictureRecord& picture, const Arguments& arguments,
+                  const OperationContext& context) {
+  return MotionBlurPicture(picture, arguments.Number("length"), arguments.Number("angle"),
+                           context.work);
 }
-int32_t ReachOfMotion(const Arguments& arguments) { return MotionReach(arguments.Number("length")); }
+int32_t ReachOfMotion(const Arguments& arguments) {
+  return MotionReach(arguments.Number("length"));
+}
 
 constexpr Parameter kRadial[] = {
     {.name = "kind", .kind = kChoice, .preset = "spin", .choices = "spin|zoom", .label = "Kind",
@@ -80,9 +100,12 @@ constexpr Parameter kRadial[] = {
     {.name = "center", .kind = kPoint, .unit = "px", .preset = "50%,50%", .label = "Center", .help = "What stays sharp."},
 };
 
-Status RadialBlur(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
-  const AreaPoint center = PointOf(arguments.Of("center"), {picture.image.Width(), picture.image.Height()}, picture.metadata);
-  return RadialBlurPicture(picture, arguments.Choice<RadialKind>("kind"), arguments.Number("amount"), center.x, center.y, context.work);
+Status RadialBlur(PictureRecord& picture, const Arguments& arguments,
+                  const OperationContext& context) {
+  const AreaPoint center = PointOf(
+      arguments.Of("center"), {picture.image.Width(), picture.image.Height()}, picture.metadata);
+  return RadialBlurPicture(picture, arguments.Choice<RadialKind>("kind"),
+                           arguments.Number("amount"), center.x, center.y, context.work);
 }
 
 constexpr Parameter kDespeckle[] = {
@@ -92,7 +115,8 @@ constexpr Parameter kDespeckle[] = {
      .help = "How much a speck differs from what is around it."},
 };
 
-Status Despeckle(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+Status Despeckle(PictureRecord& picture, const Arguments& arguments,
+                 const OperationContext& context) {
   return DespecklePicture(picture, Radius(arguments), arguments.Integer("threshold"), context.work);
 }
 
@@ -103,8 +127,10 @@ constexpr Parameter kSurface[] = {
      .help = "Pixels that differ more do not count."},
 };
 
-Status SurfaceBlur(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
-  return SurfaceBlurPicture(picture, Radius(arguments), arguments.Integer("threshold"), context.work);
+Status SurfaceBlur(PictureRecord& picture, const Arguments& arguments,
+                   const OperationContext& context) {
+  return SurfaceBlurPicture(picture, Radius(arguments), arguments.Integer("threshold"),
+                            context.work);
 }
 
 constexpr Parameter kOil[] = {
@@ -138,11 +164,26 @@ Status Emboss(PictureRecord& picture, const Arguments& arguments, const Operatio
 int32_t ReachOfGradient(const Arguments&) { return 1; }
 
 constexpr Parameter kKernel[] = {
-    {.name = "weights", .kind = kText, .most = 4000, .label = "Weights",
+    {.name = "weights",
+     .kind = kText,
+     .most = 4000,
+     .label = "Weights",
      .help = "9, 25, 49 or 81 numbers with blanks or commas between them, row by row."},
-    {.name = "divisor", .kind = kNumber, .preset = "", .least = -1e6, .most = 1e6, .label = "Divisor",
-     .help = "What the sum is divided by; that of the weights when it is left out, or 1 if that is 0."},
-    {.name = "bias", .kind = kNumber, .unit = "levels", .preset = "0", .least = -255, .most = 255, .label = "Bias",
+    {.name = "divisor",
+     .kind = kNumber,
+     .preset = "",
+     .least = -1e6,
+     .most = 1e6,
+     .label = "Divisor",
+     .help =
+         "What the sum is divided by; that of the weights when it is left out, or 1 if that is 0."},
+    {.name = "bias",
+     .kind = kNumber,
+     .unit = "levels",
+     .preset = "0",
+     .least = -255,
+     .most = 255,
+     .label = "Bias",
      .help = "What is added in the end."},
 };
 
@@ -166,8 +207,10 @@ std::vector<double> NumbersOf(const std::string& text) {
 
 ArgumentProblem CheckKernel(const Arguments& arguments) {
   const size_t count = NumbersOf(arguments.Text("weights")).size();
-  if (count != 9 && count != 25 && count != 49 && count != 81) return {"weights", "must be 9, 25, 49 or 81 numbers"};
-  if (arguments.Has("divisor") && arguments.Number("divisor") == 0) return {"divisor", "must not be 0"};
+  if (count != 9 && count != 25 && count != 49 && count != 81)
+    return {"weights", "must be 9, 25, 49 or 81 numbers"};
+  if (arguments.Has("divisor") && arguments.Number("divisor") == 0)
+    return {"divisor", "must not be 0"};
   return {};
 }
 
@@ -176,14 +219,21 @@ Status Kernel(PictureRecord& picture, const Arguments& arguments, const Operatio
   double divisor = 0;
   for (const double weight : weights) divisor += weight;
   if (arguments.Has("divisor")) divisor = arguments.Number("divisor");
-  return ConvolvePicture(picture, weights, divisor == 0 ? 1 : divisor, arguments.Number("bias"), context.work);
+  return ConvolvePicture(picture, weights, divisor == 0 ? 1 : divisor, arguments.Number("bias"),
+                         context.work);
 }
-int32_t ReachOfKernel(const Arguments& arguments) { return KernelReach(NumbersOf(arguments.Text("weights")).size()); }
+int32_t ReachOfKernel(const Arguments& arguments) {
+  return KernelReach(NumbersOf(arguments.Text("weights")).size());
+}
 
-// A rectangle of the whole picture, seen from the part that is computed; without one, all of the picture.
-Rectangle AreaOfPart(const PictureRecord& picture, const Value& area, const OperationContext& context) {
-  const Size own{picture.image.Width(), picture.image.Height()}, whole = context.whole.width > 0 ? context.whole : own;
-  Rectangle seen = area.given ? AreaOf(area, whole, picture.metadata) : Rectangle{0, 0, whole.width, whole.height};
+// A rectangle of the whole picture, seen from the part that is computed; without one, all of the
+// picture.
+Rectangle AreaOfPart(const PictureRecord& picture, const Value& area,
+                     const OperationContext& context) {
+  const Size own{picture.image.Width(), picture.image.Height()},
+      whole = context.whole.width > 0 ? context.whole : own;
+  Rectangle seen = area.given ? AreaOf(area, whole, picture.metadata)
+                              : Rectangle{0, 0, whole.width, whole.height};
   seen.x -= context.left;
   seen.y -= context.top;
   return seen;
@@ -195,7 +245,8 @@ constexpr Parameter kMosaic[] = {
 };
 
 Status Mosaic(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
-  return MosaicPicture(picture, AreaOfPart(picture, arguments.Of("area"), context), arguments.Integer("size"), context.work);
+  return MosaicPicture(picture, AreaOfPart(picture, arguments.Of("area"), context),
+                       arguments.Integer("size"), context.work);
 }
 int32_t ReachOfMosaic(const Arguments& arguments) { return arguments.Integer("size"); }
 
@@ -206,51 +257,166 @@ constexpr Parameter kRedEye[] = {
 };
 
 Status RedEye(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
-  return RemoveRedEye(picture, AreaOfPart(picture, arguments.Of("area"), context), 2.6 - arguments.Number("sensitivity") / 50);
+  return RemoveRedEye(picture, AreaOfPart(picture, arguments.Of("area"), context),
+                      2.6 - arguments.Number("sensitivity") / 50);
 }
 int32_t NoReach(const Arguments&) { return 0; }
 
 constexpr Operation kOperations[] = {
-    {.name = "blur", .family = Family::Filter, .label = "Gaussian blur", .help = "Blurs a picture evenly.", .example = "blur 2",
-     .parameters = kBlur, .works = Works::Neighborhood, .apply = Blur, .reach = Reach},
-    {.name = "sharpen", .family = Family::Filter, .label = "Sharpen", .help = "Makes edges stand out.", .example = "sharpen 0.6",
-     .parameters = kBlur, .works = Works::Neighborhood, .apply = Sharpen, .reach = Reach},
-    {.name = "unsharp", .family = Family::Filter, .label = "Unsharp mask",
-     .help = "Sharpens by adding the difference to a blurred copy.", .example = "unsharp 1.5 0.8 threshold=3",
-     .parameters = kUnsharp, .works = Works::Neighborhood, .apply = Unsharp, .reach = Reach},
-    {.name = "box-blur", .family = Family::Filter, .label = "Box blur",
-     .help = "Replaces each pixel by the mean of a square around it.", .example = "box-blur 3", .parameters = kWindow,
-     .works = Works::Neighborhood, .apply = BoxBlur, .reach = Radius},
-    {.name = "median", .family = Family::Filter, .label = "Median",
-     .help = "Replaces each pixel by the median of a square around it: removes specks and keeps edges.", .example = "median 2",
-     .parameters = kWindow, .works = Works::Neighborhood, .apply = ApplyRank<Rank::Median>, .reach = Radius},
-    {.name = "minimum", .family = Family::Filter, .label = "Minimum",
-     .help = "Replaces each pixel by the darkest level of a square around it: dark parts grow.", .example = "minimum 2",
-     .parameters = kWindow, .works = Works::Neighborhood, .apply = ApplyRank<Rank::Minimum>, .reach = Radius},
-    {.name = "maximum", .family = Family::Filter, .label = "Maximum",
-     .help = "Replaces each pixel by the brightest level of a square around it: bright parts grow.", .example = "maximum 2",
-     .parameters = kWindow, .works = Works::Neighborhood, .apply = ApplyRank<Rank::Maximum>, .reach = Radius},
-    {.name = "motion-blur", .family = Family::Filter, .label = "Motion blur", .help = "Blurs along a line.",
-     .example = "motion-blur 12 30", .parameters = kMotion, .works = Works::Neighborhood, .apply = MotionBlur, .reach = ReachOfMotion},
-    {.name = "radial-blur", .family = Family::Filter, .label = "Radial blur", .help = "Blurs around a center or away from it.",
-     .example = "radial-blur zoom 20", .parameters = kRadial, .works = Works::WholePicture, .apply = RadialBlur},
-    {.name = "despeckle", .family = Family::Filter, .label = "Despeckle", .help = "Removes specks and leaves the rest alone.",
-     .example = "despeckle threshold=30", .parameters = kDespeckle, .works = Works::Neighborhood, .apply = Despeckle, .reach = Radius},
-    {.name = "surface-blur", .family = Family::Filter, .label = "Surface blur", .help = "Blurs surfaces and keeps edges.",
-     .example = "surface-blur 4 25", .parameters = kSurface, .works = Works::Neighborhood, .apply = SurfaceBlur, .reach = Radius},
-    {.name = "edges", .family = Family::Filter, .label = "Edges", .help = "Shows edges bright on black.", .example = "edges",
-     .parameters = kEdges, .works = Works::Neighborhood, .apply = Edges, .reach = ReachOfGradient},
-    {.name = "emboss", .family = Family::Filter, .label = "Emboss", .help = "Makes a gray relief of the picture.",
-     .example = "emboss 315 3", .parameters = kEmboss, .works = Works::Neighborhood, .apply = Emboss, .reach = ReachOfGradient},
-    {.name = "oil", .family = Family::Filter, .label = "Oil painting", .help = "Makes strokes of one color.", .example = "oil 3",
-     .parameters = kOil, .works = Works::Neighborhood, .apply = Oil, .reach = Radius},
-    {.name = "mosaic", .family = Family::Filter, .label = "Mosaic", .help = "Makes squares of one color, to hide a face or a number.",
-     .example = "mosaic 8 50%x50%+10+10", .parameters = kMosaic, .works = Works::Neighborhood, .apply = Mosaic, .reach = ReachOfMosaic},
-    {.name = "kernel", .family = Family::Filter, .label = "Own filter", .help = "Weighs the pixels around each pixel.",
-     .example = "kernel \"0 -1 0 -1 5 -1 0 -1 0\"", .parameters = kKernel, .works = Works::Neighborhood, .apply = Kernel,
-     .reach = ReachOfKernel, .check = CheckKernel},
-    {.name = "red-eye", .family = Family::Filter, .label = "Red eyes", .help = "Takes the red of a flash out of eyes.",
-     .example = "red-eye 50%x50%+10%+10%", .parameters = kRedEye, .works = Works::Neighborhood, .apply = RedEye, .reach = NoReach},
+    {.name = "blur",
+     .family = Family::Filter,
+     .label = "Gaussian blur",
+     .help = "Blurs a picture evenly.",
+     .example = "blur 2",
+     .parameters = kBlur,
+     .works = Works::Neighborhood,
+     .apply = Blur,
+     .reach = Reach},
+    {.name = "sharpen",
+     .family = Family::Filter,
+     .label = "Sharpen",
+     .help = "Makes edges stand out.",
+     .example = "sharpen 0.6",
+     .parameters = kBlur,
+     .works = Works::Neighborhood,
+     .apply = Sharpen,
+     .reach = Reach},
+    {.name = "unsharp",
+     .family = Family::Filter,
+     .label = "Unsharp mask",
+     .help = "Sharpens by adding the difference to a blurred copy.",
+     .example = "unsharp 1.5 0.8 threshold=3",
+     .parameters = kUnsharp,
+     .works = Works::Neighborhood,
+     .apply = Unsharp,
+     .reach = Reach},
+    {.name = "box-blur",
+     .family = Family::Filter,
+     .label = "Box blur",
+     .help = "Replaces each pixel by the mean of a square around it.",
+     .example = "box-blur 3",
+     .parameters = kWindow,
+     .works = Works::Neighborhood,
+     .apply = BoxBlur,
+     .reach = Radius},
+    {.name = "median",
+     .family = Family::Filter,
+     .label = "Median",
+     .help =
+         "Replaces each pixel by the median of a square around it: removes specks and keeps edges.",
+     .example = "median 2",
+     .parameters = kWindow,
+     .works = Works::Neighborhood,
+     .apply = ApplyRank<Rank::Median>,
+     .reach = Radius},
+    {.name = "minimum",
+     .family = Family::Filter,
+     .label = "Minimum",
+     .help = "Replaces each pixel by the darkest level of a square around it: dark parts grow.",
+     .example = "minimum 2",
+     .parameters = kWindow,
+     .works = Works::Neighborhood,
+     .apply = ApplyRank<Rank::Minimum>,
+     .reach = Radius},
+    {.name = "maximum",
+     .family = Family::Filter,
+     .label = "Maximum",
+     .help = "Replaces each pixel by the brightest level of a square around it: bright parts grow.",
+     .example = "maximum 2",
+     .parameters = kWindow,
+     .works = Works::Neighborhood,
+     .apply = ApplyRank<Rank::Maximum>,
+     .reach = Radius},
+    {.name = "motion-blur",
+     .family = Family::Filter,
+     .label = "Motion blur",
+     .help = "Blurs along a line.",
+     .example = "motion-blur 12 30",
+     .parameters = kMotion,
+     .works = Works::Neighborhood,
+     .apply = MotionBlur,
+     .reach = ReachOfMotion},
+    {.name = "radial-blur",
+     .family = Family::Filter,
+     .label = "Radial blur",
+     .help = "Blurs around a center or away from it.",
+     .example = "radial-blur zoom 20",
+     .parameters = kRadial,
+     .works = Works::WholePicture,
+     .apply = RadialBlur},
+    {.name = "despeckle",
+     .family = Family::Filter,
+     .label = "Despeckle",
+     .help = "Removes specks and leaves the rest alone.",
+     .example = "despeckle threshold=30",
+     .parameters = kDespeckle,
+     .works = Works::Neighborhood,
+     .apply = Despeckle,
+     .reach = Radius},
+    {.name = "surface-blur",
+     .family = Family::Filter,
+     .label = "Surface blur",
+     .help = "Blurs surfaces and keeps edges.",
+     .example = "surface-blur 4 25",
+     .parameters = kSurface,
+     .works = Works::Neighborhood,
+     .apply = SurfaceBlur,
+     .reach = Radius},
+    {.name = "edges",
+     .family = Family::Filter,
+     .label = "Edges",
+     .help = "Shows edges bright on black.",
+     .example = "edges",
+     .parameters = kEdges,
+     .works = Works::Neighborhood,
+     .apply = Edges,
+     .reach = ReachOfGradient},
+    {.name = "emboss",
+     .family = Family::Filter,
+     .label = "Emboss",
+     .help = "Makes a gray relief of the picture.",
+     .example = "emboss 315 3",
+     .parameters = kEmboss,
+     .works = Works::Neighborhood,
+     .apply = Emboss,
+     .reach = ReachOfGradient},
+    {.name = "oil",
+     .family = Family::Filter,
+     .label = "Oil painting",
+     .help = "Makes strokes of one color.",
+     .example = "oil 3",
+     .parameters = kOil,
+     .works = Works::Neighborhood,
+     .apply = Oil,
+     .reach = Radius},
+    {.name = "mosaic",
+     .family = Family::Filter,
+     .label = "Mosaic",
+     .help = "Makes squares of one color, to hide a face or a number.",
+     .example = "mosaic 8 50%x50%+10+10",
+     .parameters = kMosaic,
+     .works = Works::Neighborhood,
+     .apply = Mosaic,
+     .reach = ReachOfMosaic},
+    {.name = "kernel",
+     .family = Family::Filter,
+     .label = "Own filter",
+     .help = "Weighs the pixels around each pixel.",
+     .example = "kernel \"0 -1 0 -1 5 -1 0 -1 0\"",
+     .parameters = kKernel,
+     .works = Works::Neighborhood,
+     .apply = Kernel,
+     .reach = ReachOfKernel,
+     .check = CheckKernel},
+    {.name = "red-eye",
+     .family = Family::Filter,
+     .label = "Red eyes",
+     .help = "Takes the red of a flash out of eyes.",
+     .example = "red-eye 50%x50%+10%+10%",
+     .parameters = kRedEye,
+     .works = Works::Neighborhood,
+     .apply = RedEye,
+     .reach = NoReach},
 };
 
 }  // namespace

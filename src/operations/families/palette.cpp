@@ -14,10 +14,13 @@ namespace {
 
 using enum ParameterKind;
 
-constexpr const char* kDitherWords = "none|floyd-steinberg|atkinson|stucki|burkes|sierra|bayer2|bayer4|bayer8";
-constexpr Dither kDithers[] = {Dither::None,   Dither::FloydSteinberg, Dither::Atkinson, Dither::Stucki, Dither::Burkes,
-                               Dither::Sierra, Dither::Ordered2,       Dither::Ordered4, Dither::Ordered};
-constexpr const char* kDitherKeyWords = "none|bayer8|floyd-steinberg";  // values of FXColorDither and FXMonoDither
+constexpr const char* kDitherWords =
+    "none|floyd-steinberg|atkinson|stucki|burkes|sierra|bayer2|bayer4|bayer8";
+constexpr Dither kDithers[] = {Dither::None,     Dither::FloydSteinberg, Dither::Atkinson,
+                               Dither::Stucki,   Dither::Burkes,         Dither::Sierra,
+                               Dither::Ordered2, Dither::Ordered4,       Dither::Ordered};
+// values of FXColorDither and FXMonoDither
+constexpr const char* kDitherKeyWords = "none|bayer8|floyd-steinberg";
 
 // clang-format off
 constexpr Parameter kBidirectional =
@@ -63,8 +66,10 @@ PaletteChoice FixedPalette(int32_t colors) {
   struct Standard {
     int32_t colors, kind;  // of MakeDefaultPalette
   };
-  constexpr Standard kStandards[] = {{256, 8}, {216, 6}, {128, 5}, {64, 4}, {32, 3}, {16, 2}, {8, 1}, {2, 0}};
-  const auto* fits = std::ranges::find_if(kStandards, [=](const Standard& standard) { return standard.colors <= colors; });
+  constexpr Standard kStandards[] = {{256, 8}, {216, 6}, {128, 5}, {64, 4},
+                                     {32, 3},  {16, 2},  {8, 1},   {2, 0}};
+  const auto* fits = std::ranges::find_if(
+      kStandards, [=](const Standard& standard) { return standard.colors <= colors; });
   PaletteChoice choice{.kind = PaletteChoice::Kind::Given, .colors = fits->colors};
   MakeDefaultPalette(&choice.given, nullptr, fits->kind);
   return choice;
@@ -89,17 +94,21 @@ std::string LoadColorTable(const std::string& path, PaletteChoice& choice) {
     return "is neither optimized, fixed, gray or file nor a color table that can be read";
   }
   choice.kind = PaletteChoice::Kind::Given;
-  return ReadColorTable(contents, choice.given, choice.colors) == Status::Ok ? "" : "names a file that is not a color table";
+  return ReadColorTable(contents, choice.given, choice.colors) == Status::Ok
+             ? ""
+             : "names a file that is not a color table";
 }
 
 ArgumentProblem CheckReduce(const Arguments& arguments) {
   const std::string path = ColorTableFile(arguments);
   const std::string& palette = arguments.Text("palette");
-  if (path.empty() && (palette == "optimized" || palette == "fixed" || palette == "gray")) return {};
+  if (path.empty() && (palette == "optimized" || palette == "fixed" || palette == "gray"))
+    return {};
   PaletteChoice choice;
   const std::string problem = LoadColorTable(path, choice);
   if (problem.empty()) return {};
-  if (palette == "file") return {"file", "names no color table that can be read: " + arguments.Text("file")};
+  if (palette == "file")
+    return {"file", "names no color table that can be read: " + arguments.Text("file")};
   return {"palette", problem};
 }
 
@@ -134,12 +143,24 @@ Status Mono(PictureRecord& picture, const Arguments& arguments, const OperationC
 }
 
 constexpr Operation kOperations[] = {
-    {.name = "reduce", .family = Family::Effects, .label = "Reduce colors",
-     .help = "Brings a picture down to a palette of at most 256 colors, at 1, 4 or 8 bits per pixel.",
-     .example = "reduce 16 dither=stucki", .parameters = kReduce, .works = Works::Colors, .apply = Reduce, .check = CheckReduce},
-    {.name = "mono", .family = Family::Effects, .label = "Black and white",
-     .help = "Brings a picture down to black and white at 1 bit per pixel.", .example = "mono dither=atkinson",
-     .parameters = kMono, .works = Works::Colors, .apply = Mono},
+    {.name = "reduce",
+     .family = Family::Effects,
+     .label = "Reduce colors",
+     .help =
+         "Brings a picture down to a palette of at most 256 colors, at 1, 4 or 8 bits per pixel.",
+     .example = "reduce 16 dither=stucki",
+     .parameters = kReduce,
+     .works = Works::Colors,
+     .apply = Reduce,
+     .check = CheckReduce},
+    {.name = "mono",
+     .family = Family::Effects,
+     .label = "Black and white",
+     .help = "Brings a picture down to black and white at 1 bit per pixel.",
+     .example = "mono dither=atkinson",
+     .parameters = kMono,
+     .works = Works::Colors,
+     .apply = Mono},
 };
 
 }  // namespace

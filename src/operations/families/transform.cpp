@@ -22,26 +22,56 @@ using enum ParameterKind;
 
 enum class Mode : int32_t { Fit, Fill, Stretch, Pad };
 enum class Only : int32_t { Shrink, Grow };
-constexpr ScaleFilter kFilters[] = {ScaleFilter::Nearest, ScaleFilter::Box,      ScaleFilter::Bilinear,
-                                    ScaleFilter::Bicubic, ScaleFilter::Mitchell, ScaleFilter::Lanczos};
+constexpr ScaleFilter kFilters[] = {ScaleFilter::Nearest,  ScaleFilter::Box,
+                                    ScaleFilter::Bilinear, ScaleFilter::Bicubic,
+                                    ScaleFilter::Mitchell, ScaleFilter::Lanczos};
 
 constexpr Parameter kResize[] = {
-    {.name = "size", .kind = kSize, .unit = "px", .least = 0.0001, .most = 1e9, .label = "Size",
+    {.name = "size",
+     .kind = kSize,
+     .unit = "px",
+     .least = 0.0001,
+     .most = 1e9,
+     .label = "Size",
      .help = "WxH, Wx or xH; or one value for the longest edge, in pixels, percent, cm, mm or in."},
-    {.name = "mode", .kind = kChoice, .preset = "fit", .choices = "fit|fill|stretch|pad", .label = "Mode",
-     .help = "fit keeps the proportions within the size, fill crops what is too much, stretch ignores them, pad adds a background."},
-    {.name = "filter", .kind = kChoice, .preset = "bicubic", .choices = "nearest|box|triangle|bicubic|mitchell|lanczos3",
-     .label = "Filter", .help = "How pixels are computed from those around them.", .key = "ResizeFilter",
+    {.name = "mode",
+     .kind = kChoice,
+     .preset = "fit",
+     .choices = "fit|fill|stretch|pad",
+     .label = "Mode",
+     .help = "fit keeps the proportions within the size, fill crops what is too much, stretch "
+             "ignores them, pad adds a background."},
+    {.name = "filter",
+     .kind = kChoice,
+     .preset = "bicubic",
+     .choices = "nearest|box|triangle|bicubic|mitchell|lanczos3",
+     .label = "Filter",
+     .help = "How pixels are computed from those around them.",
+     .key = "ResizeFilter",
      .keyWords = "bicubic|lanczos3|triangle|nearest"},
-    {.name = "only", .kind = kChoice, .preset = "", .choices = "shrink|grow", .label = "Only",
+    {.name = "only",
+     .kind = kChoice,
+     .preset = "",
+     .choices = "shrink|grow",
+     .label = "Only",
      .help = "shrink leaves pictures alone that are smaller, grow those that are larger."},
-    {.name = "linear", .kind = kFlag, .preset = "no", .label = "Linear light",
-     .help = "Computes with light instead of sRGB values: slower, and fine bright details keep their brightness."},
-    {.name = "background", .kind = kColor, .preset = "#ffffff", .label = "Background",
-     .help = "What pad fills the rest of the size with.", .key = "AlphaBackground"},
+    {.name = "linear",
+     .kind = kFlag,
+     .preset = "no",
+     .label = "Linear light",
+     .help = "Computes with light instead of sRGB values: slower, and fine bright details keep "
+             "their brightness."},
+    {.name = "background",
+     .kind = kColor,
+     .preset = "#ffffff",
+     .label = "Background",
+     .help = "What pad fills the rest of the size with.",
+     .key = "AlphaBackground"},
 };
 
-int32_t Whole(double pixels) { return static_cast<int32_t>(std::floor(std::clamp(pixels, 1.0, 2147483646.0) + 0.5)); }
+int32_t Whole(double pixels) {
+  return static_cast<int32_t>(std::floor(std::clamp(pixels, 1.0, 2147483646.0) + 0.5));
+}
 
 // What `resize` aims at: the size of the scaled picture, and that of the result.
 struct Target {
@@ -57,19 +87,23 @@ Size Proportional(Size picture, double width, double height, bool cover) {
 }
 
 Target TargetOf(const Value& wanted, Mode mode, Size picture, const PictureMetadata& metadata) {
-  const double width = wanted.width.Pixels(picture.width, metadata.dpiX), height = wanted.height.Pixels(picture.height, metadata.dpiY);
+  const double width = wanted.width.Pixels(picture.width, metadata.dpiX),
+               height = wanted.height.Pixels(picture.height, metadata.dpiY);
   if (wanted.longestEdge) {
     if (wanted.width.unit == LengthUnit::Percent) {
       const Size scaled{Whole(width), Whole(wanted.width.Pixels(picture.height, 0))};
       return {scaled, scaled};
     }
-    const double edge = picture.width >= picture.height ? width : wanted.width.Pixels(picture.height, metadata.dpiY);
+    const double edge = picture.width >= picture.height
+                            ? width
+                            : wanted.width.Pixels(picture.height, metadata.dpiY);
     const Size scaled = Proportional(picture, edge, edge, false);
     return {scaled, scaled};
   }
   if (!wanted.hasHeight || !wanted.hasWidth) {
-    const Size scaled = wanted.hasWidth ? Size{Whole(width), Whole(picture.height * width / picture.width)}
-                                        : Size{Whole(picture.width * height / picture.height), Whole(height)};
+    const Size scaled = wanted.hasWidth
+                            ? Size{Whole(width), Whole(picture.height * width / picture.width)}
+                            : Size{Whole(picture.width * height / picture.height), Whole(height)};
     return {scaled, scaled};
   }
   const Size box{Whole(width), Whole(height)};
@@ -104,21 +138,39 @@ Status Resize(PictureRecord& picture, const Arguments& arguments, const Operatio
                                             .work = context.work,
                                             .progress = picture.progress}));
   }
-  const Size result{mode == Mode::Fill ? std::min(target.result.width, target.scaled.width) : target.result.width,
-                    mode == Mode::Fill ? std::min(target.result.height, target.scaled.height) : target.result.height};
-  if (mode == Mode::Fill) return CutPicture(picture, PlaceWithin(target.scaled, result, Gravity::Center));
+  const Size result{
+      mode == Mode::Fill ? std::min(target.result.width, target.scaled.width) : target.result.width,
+      mode == Mode::Fill ? std::min(target.result.height, target.scaled.height)
+                         : target.result.height};
+  if (mode == Mode::Fill)
+    return CutPicture(picture, PlaceWithin(target.scaled, result, Gravity::Center));
   if (mode != Mode::Pad) return Status::Ok;
-  const Size padded{std::max(result.width, target.scaled.width), std::max(result.height, target.scaled.height)};
+  const Size padded{std::max(result.width, target.scaled.width),
+                    std::max(result.height, target.scaled.height)};
   const Rectangle place = PlaceWithin(padded, target.scaled, Gravity::Center);
-  return PlaceOnCanvas(picture, padded, place.x, place.y, BackdropOf(arguments.Color("background")));
+  return PlaceOnCanvas(picture, padded, place.x, place.y,
+                       BackdropOf(arguments.Color("background")));
 }
 
-constexpr Parameter kBackground = {.name = "background", .kind = kColor, .preset = "#ffffff", .label = "Background",
-                                   .help = "What is seen where the picture does not reach.", .key = "AlphaBackground"};
-constexpr Parameter kGrow = {.name = "mode", .kind = kChoice, .preset = "grow", .choices = "grow|keep", .label = "Mode",
-                             .help = "grow makes room for the whole picture, keep leaves its size."};
-constexpr Parameter kSampling = {.name = "filter", .kind = kChoice, .preset = "bicubic", .choices = "bicubic|bilinear|nearest",
-                                 .label = "Filter", .help = "How pixels are computed from those around them."};
+constexpr Parameter kBackground = {.name = "background",
+                                   .kind = kColor,
+                                   .preset = "#ffffff",
+                                   .label = "Background",
+                                   .help = "What is seen where the picture does not reach.",
+                                   .key = "AlphaBackground"};
+constexpr Parameter kGrow = {
+    .name = "mode",
+    .kind = kChoice,
+    .preset = "grow",
+    .choices = "grow|keep",
+    .label = "Mode",
+    .help = "grow makes room for the whole picture, keep leaves its size."};
+constexpr Parameter kSampling = {.name = "filter",
+                                 .kind = kChoice,
+                                 .preset = "bicubic",
+                                 .choices = "bicubic|bilinear|nearest",
+                                 .label = "Filter",
+                                 .help = "How pixels are computed from those around them."};
 constexpr Parameter kRotate[] = {
     {.name = "angle", .kind = kAngle, .unit = "degrees", .least = -360, .most = 360, .label = "Angle",
      .help = "Clockwise. Multiples of 90 change no pixel."},
@@ -126,11 +178,14 @@ constexpr Parameter kRotate[] = {
 };
 
 WarpOptions SamplingOf(const Arguments& arguments) {
-  return {.filter = arguments.Choice<WarpFilter>("filter"), .edgesRepeat = false, .backdrop = BackdropOf(arguments.Color("background"))};
+  return {.filter = arguments.Choice<WarpFilter>("filter"),
+          .edgesRepeat = false,
+          .backdrop = BackdropOf(arguments.Color("background"))};
 }
 
 Status Rotate(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
-  return RotatePicture(picture, arguments.Number("angle"), arguments.Choice("mode") == 0, SamplingOf(arguments), context.work);
+  return RotatePicture(picture, arguments.Number("angle"), arguments.Choice("mode") == 0,
+                       SamplingOf(arguments), context.work);
 }
 
 constexpr Parameter kStraighten[] = {
@@ -138,8 +193,10 @@ constexpr Parameter kStraighten[] = {
     kSampling,
 };
 
-Status Straighten(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
-  return StraightenPicture(picture, arguments.Number("angle"), arguments.Choice<WarpFilter>("filter"), context.work);
+Status Straighten(PictureRecord& picture, const Arguments& arguments,
+                  const OperationContext& context) {
+  return StraightenPicture(picture, arguments.Number("angle"),
+                           arguments.Choice<WarpFilter>("filter"), context.work);
 }
 
 constexpr Parameter kDeskew[] = {
@@ -155,7 +212,8 @@ Status Deskew(PictureRecord& picture, const Arguments& arguments, const Operatio
   double angle = 0;
   RETURN_IF_BAD(FindSkew(picture, arguments.Number("most"), context.work, angle));
   if (angle == 0) return Status::Ok;
-  return RotatePicture(picture, -angle, arguments.Choice("mode") == 0, SamplingOf(arguments), context.work);
+  return RotatePicture(picture, -angle, arguments.Choice("mode") == 0, SamplingOf(arguments),
+                       context.work);
 }
 
 constexpr Parameter kShear[] = {
@@ -167,24 +225,50 @@ constexpr Parameter kShear[] = {
 };
 
 Status Shear(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
-  return ShearPicture(picture, arguments.Number("across"), arguments.Number("down"), SamplingOf(arguments), context.work);
+  return ShearPicture(picture, arguments.Number("across"), arguments.Number("down"),
+                      SamplingOf(arguments), context.work);
 }
 
 constexpr Parameter kPerspective[] = {
-    {.name = "top-left", .kind = kPoint, .unit = "px", .preset = "0,0", .label = "Top left",
+    {.name = "top-left",
+     .kind = kPoint,
+     .unit = "px",
+     .preset = "0,0",
+     .label = "Top left",
      .help = "The point of the picture that becomes this corner."},
-    {.name = "top-right", .kind = kPoint, .unit = "px", .preset = "100%,0", .label = "Top right",
+    {.name = "top-right",
+     .kind = kPoint,
+     .unit = "px",
+     .preset = "100%,0",
+     .label = "Top right",
      .help = "The point of the picture that becomes this corner."},
-    {.name = "bottom-right", .kind = kPoint, .unit = "px", .preset = "100%,100%", .label = "Bottom right",
+    {.name = "bottom-right",
+     .kind = kPoint,
+     .unit = "px",
+     .preset = "100%,100%",
+     .label = "Bottom right",
      .help = "The point of the picture that becomes this corner."},
-    {.name = "bottom-left", .kind = kPoint, .unit = "px", .preset = "0,100%", .label = "Bottom left",
+    {.name = "bottom-left",
+     .kind = kPoint,
+     .unit = "px",
+     .preset = "0,100%",
+     .label = "Bottom left",
      .help = "The point of the picture that becomes this corner."},
-    {.name = "size", .kind = kSize, .unit = "px", .preset = "", .least = 0.0001, .most = 1e9, .label = "Size",
-     .help = "WxH, Wx or xH of the result, or one value for both edges. As long as the longer edge between the points when it is left out."},
-    kBackground, kSampling,
+    {.name = "size",
+     .kind = kSize,
+     .unit = "px",
+     .preset = "",
+     .least = 0.0001,
+     .most = 1e9,
+     .label = "Size",
+     .help = "WxH, Wx or xH of the result, or one value for both edges. As long as the longer edge "
+             "between the points when it is left out."},
+    kBackground,
+    kSampling,
 };
 
-Status Perspective(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
+Status Perspective(PictureRecord& picture, const Arguments& arguments,
+                   const OperationContext& context) {
   constexpr const char* kNames[] = {"top-left", "top-right", "bottom-right", "bottom-left"};
   const PictureMetadata& metadata = picture.metadata;
   const Size whole{picture.image.Width(), picture.image.Height()};
@@ -197,8 +281,10 @@ Status Perspective(PictureRecord& picture, const Arguments& arguments, const Ope
   if (arguments.Has("size")) {
     const Value& wanted = arguments.Of("size");
     const Length& down = wanted.longestEdge ? wanted.width : wanted.height;
-    if (wanted.hasWidth || wanted.longestEdge) size.width = Whole(wanted.width.Pixels(whole.width, metadata.dpiX));
-    if (wanted.hasHeight || wanted.longestEdge) size.height = Whole(down.Pixels(whole.height, metadata.dpiY));
+    if (wanted.hasWidth || wanted.longestEdge)
+      size.width = Whole(wanted.width.Pixels(whole.width, metadata.dpiX));
+    if (wanted.hasHeight || wanted.longestEdge)
+      size.height = Whole(down.Pixels(whole.height, metadata.dpiY));
   }
   return UnwarpPicture(picture, corners, size, SamplingOf(arguments), context.work);
 }
@@ -219,35 +305,89 @@ constexpr Parameter kFlip[] = {
 };
 
 Status Flip(PictureRecord& picture, const Arguments& arguments, const OperationContext&) {
-  constexpr Orientation kWays[] = {Orientation::MirrorAcross, Orientation::MirrorDown, Orientation::HalfTurn};
+  constexpr Orientation kWays[] = {Orientation::MirrorAcross, Orientation::MirrorDown,
+                                   Orientation::HalfTurn};
   return OrientPicture(picture, kWays[arguments.Choice("direction")]);
 }
 
-Status Upright(PictureRecord& picture, const Arguments&, const OperationContext&) { return TurnUpright(picture); }
+Status Upright(PictureRecord& picture, const Arguments&, const OperationContext&) {
+  return TurnUpright(picture);
+}
 
 constexpr Operation kOperations[] = {
-    {.name = "resize", .family = Family::Transform, .label = "Resize", .help = "Scales a picture to another size.",
-     .example = "resize 800x600 filter=lanczos3", .parameters = kResize, .works = Works::Geometry, .apply = Resize},
-    {.name = "rotate", .family = Family::Transform, .label = "Rotate", .help = "Rotates a picture clockwise.",
-     .example = "rotate 7 background=black", .parameters = kRotate, .works = Works::Geometry, .apply = Rotate},
-    {.name = "flip", .family = Family::Transform, .label = "Flip", .help = "Mirrors a picture.", .example = "flip vertical",
-     .parameters = kFlip, .works = Works::Geometry, .apply = Flip},
-    {.name = "upright", .family = Family::Transform, .label = "Upright",
-     .help = "Rotates a picture as its EXIF orientation says.", .example = "upright", .parameters = {},
-     .works = Works::Geometry, .apply = Upright},
-    {.name = "straighten", .family = Family::Transform, .label = "Straighten",
-     .help = "Rotates a picture a little and crops it to the largest upright rectangle.", .example = "straighten 2.5",
-     .parameters = kStraighten, .works = Works::Geometry, .apply = Straighten},
-    {.name = "deskew", .family = Family::Transform, .label = "Deskew", .help = "Finds the angle of a scanned page and sets it straight.",
-     .example = "deskew 10", .parameters = kDeskew, .works = Works::Geometry, .apply = Deskew},
-    {.name = "shear", .family = Family::Transform, .label = "Shear", .help = "Slants a picture.", .example = "shear 10",
-     .parameters = kShear, .works = Works::Geometry, .apply = Shear},
-    {.name = "perspective", .family = Family::Transform, .label = "Perspective",
-     .help = "Makes a rectangle of the shape between four points, such as a sheet of paper in a photo.",
-     .example = "perspective 10%,5% 90%,0 100%,100% 0,95%", .parameters = kPerspective, .works = Works::Geometry, .apply = Perspective},
-    {.name = "offset", .family = Family::Transform, .label = "Offset",
-     .help = "Moves a picture; what leaves on one side comes in on the other.", .example = "offset 50% 0", .parameters = kOffset,
-     .works = Works::Geometry, .apply = Offset},
+    {.name = "resize",
+     .family = Family::Transform,
+     .label = "Resize",
+     .help = "Scales a picture to another size.",
+     .example = "resize 800x600 filter=lanczos3",
+     .parameters = kResize,
+     .works = Works::Geometry,
+     .apply = Resize},
+    {.name = "rotate",
+     .family = Family::Transform,
+     .label = "Rotate",
+     .help = "Rotates a picture clockwise.",
+     .example = "rotate 7 background=black",
+     .parameters = kRotate,
+     .works = Works::Geometry,
+     .apply = Rotate},
+    {.name = "flip",
+     .family = Family::Transform,
+     .label = "Flip",
+     .help = "Mirrors a picture.",
+     .example = "flip vertical",
+     .parameters = kFlip,
+     .works = Works::Geometry,
+     .apply = Flip},
+    {.name = "upright",
+     .family = Family::Transform,
+     .label = "Upright",
+     .help = "Rotates a picture as its EXIF orientation says.",
+     .example = "upright",
+     .parameters = {},
+     .works = Works::Geometry,
+     .apply = Upright},
+    {.name = "straighten",
+     .family = Family::Transform,
+     .label = "Straighten",
+     .help = "Rotates a picture a little and crops it to the largest upright rectangle.",
+     .example = "straighten 2.5",
+     .parameters = kStraighten,
+     .works = Works::Geometry,
+     .apply = Straighten},
+    {.name = "deskew",
+     .family = Family::Transform,
+     .label = "Deskew",
+     .help = "Finds the angle of a scanned page and sets it straight.",
+     .example = "deskew 10",
+     .parameters = kDeskew,
+     .works = Works::Geometry,
+     .apply = Deskew},
+    {.name = "shear",
+     .family = Family::Transform,
+     .label = "Shear",
+     .help = "Slants a picture.",
+     .example = "shear 10",
+     .parameters = kShear,
+     .works = Works::Geometry,
+     .apply = Shear},
+    {.name = "perspective",
+     .family = Family::Transform,
+     .label = "Perspective",
+     .help =
+         "Makes a rectangle of the shape between four points, such as a sheet of paper in a photo.",
+     .example = "perspective 10%,5% 90%,0 100%,100% 0,95%",
+     .parameters = kPerspective,
+     .works = Works::Geometry,
+     .apply = Perspective},
+    {.name = "offset",
+     .family = Family::Transform,
+     .label = "Offset",
+     .help = "Moves a picture; what leaves on one side comes in on the other.",
+     .example = "offset 50% 0",
+     .parameters = kOffset,
+     .works = Works::Geometry,
+     .apply = Offset},
 };
 
 }  // namespace

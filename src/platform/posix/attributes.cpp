@@ -17,9 +17,11 @@ namespace {
 constexpr const char* kAccessList = "system.posix_acl_access";
 constexpr size_t kMostTries = 3;  // attributes may grow while they are read
 
-// Attributes that belong to the file and not to its contents; signatures and capabilities of the old contents stay behind.
+// Attributes that belong to the file and not to its contents; signatures and capabilities of the
+// old contents stay behind.
 bool GoesAlong(std::string_view name) {
-  return name.starts_with("user.") || name.starts_with("trusted.") || name == "security.selinux" || name == kAccessList;
+  return name.starts_with("user.") || name.starts_with("trusted.") || name == "security.selinux" ||
+         name == kAccessList;
 }
 
 // The system's own, which it gives to new files by itself: nobody misses them.
@@ -43,9 +45,12 @@ bool ReadAll(Call call, std::vector<char>& into) {
   return false;
 }
 
-void Add(std::string& list, std::string_view what) { list.append(list.empty() ? "" : ", ").append(what); }
+void Add(std::string& list, std::string_view what) {
+  list.append(list.empty() ? "" : ", ").append(what);
+}
 
-// Owner and group; only the superuser gives files away. Permissions meant for a group do not go to another one.
+// Owner and group; only the superuser gives files away. Permissions meant for a group do not go to
+// another one.
 void CopyOwner(const struct stat& old, int to, mode_t& mode, std::string& lost) {
   struct stat now;
   if (fstat(to, &now) != 0) return;
@@ -53,12 +58,14 @@ void CopyOwner(const struct stat& old, int to, mode_t& mode, std::string& lost) 
     Add(lost, "group");
     mode &= ~static_cast<mode_t>(S_IRWXG) | (mode & S_IRWXO) << 3;
   }
-  if (now.st_uid != old.st_uid && fchown(to, old.st_uid, static_cast<gid_t>(-1)) != 0) Add(lost, "owner");
+  if (now.st_uid != old.st_uid && fchown(to, old.st_uid, static_cast<gid_t>(-1)) != 0)
+    Add(lost, "owner");
 }
 
 bool CopyOne(const char* path, const char* name, int to) {
   std::vector<char> value;
-  if (!ReadAll([&](char* data, size_t size) { return lgetxattr(path, name, data, size); }, value)) return errno == ENODATA;
+  if (!ReadAll([&](char* data, size_t size) { return lgetxattr(path, name, data, size); }, value))
+    return errno == ENODATA;
   return fsetxattr(to, name, value.data(), value.size(), 0) == 0;
 }
 
@@ -70,13 +77,16 @@ std::string CopyAttributes(const std::string& path, const struct stat& old, int 
   CopyOwner(old, to, mode, lost);
   fchmod(to, mode);  // without the user's mask; where that fails it has fewer, never more
   std::vector<char> names;
-  if (!ReadAll([&](char* data, size_t size) { return llistxattr(path.c_str(), data, size); }, names)) names.clear();
+  if (!ReadAll([&](char* data, size_t size) { return llistxattr(path.c_str(), data, size); },
+               names))
+    names.clear();
   names.push_back('\0');
   bool accessList = false;
   for (const char* name = names.data(); *name != '\0'; name += std::string_view(name).size() + 1) {
     accessList = accessList || std::string_view(name) == kAccessList;
     if (GoesAlong(name) && !CopyOne(path.c_str(), name, to) && IsMissed(name)) {
-      Add(lost, std::string_view(name) == kAccessList ? "access control list" : "attribute " + std::string(name));
+      Add(lost, std::string_view(name) == kAccessList ? "access control list"
+                                                      : "attribute " + std::string(name));
     }
   }
   // What the folder gives to new files would let in whom the old file kept out.

@@ -19,11 +19,14 @@ bool Exchange(const std::string& a, const std::string& b) {
   return renameat2(AT_FDCWD, a.c_str(), AT_FDCWD, b.c_str(), RENAME_EXCHANGE) == 0;
 }
 
-bool IsNotKnown(int error) { return error == EINVAL || error == ENOSYS || error == EOPNOTSUPP || error == EPERM; }
+bool IsNotKnown(int error) {
+  return error == EINVAL || error == ENOSYS || error == EOPNOTSUPP || error == EPERM;
+}
 
-// What came out of the exchange is not what was expected: it goes back to its place. Somebody may have replaced the new file
-// already; then that one is the newest and stays.
-CommitResult PutBack(const std::string& temporary, const std::string& path, const FileStamp& fresh, bool& keep) {
+// What came out of the exchange is not what was expected: it goes back to its place. Somebody may
+// have replaced the new file already; then that one is the newest and stays.
+CommitResult PutBack(const std::string& temporary, const std::string& path, const FileStamp& fresh,
+                     bool& keep) {
   keep = !Exchange(temporary, path);
   if (keep) return CommitResult::Failed;
   if (StampOf(temporary) == fresh) return CommitResult::Taken;
@@ -31,7 +34,8 @@ CommitResult PutBack(const std::string& temporary, const std::string& path, cons
   return keep ? CommitResult::Failed : CommitResult::Taken;
 }
 
-CommitResult ReplaceByExchange(const std::string& temporary, const std::string& path, const FileStamp& expected, bool& keep) {
+CommitResult ReplaceByExchange(const std::string& temporary, const std::string& path,
+                               const FileStamp& expected, bool& keep) {
   const FileStamp fresh = StampOf(temporary);
   if (!Exchange(temporary, path)) return CommitResult::Failed;
   if (!(StampOf(temporary) == expected)) return PutBack(temporary, path, fresh, keep);
@@ -39,8 +43,10 @@ CommitResult ReplaceByExchange(const std::string& temporary, const std::string& 
   return CommitResult::Done;
 }
 
-// The old file has a second name while the new one takes its place. false: the file system knows no second names.
-bool ReplaceByLink(const std::string& temporary, const std::string& path, const FileStamp& expected, CommitResult& result) {
+// The old file has a second name while the new one takes its place. false: the file system knows no
+// second names.
+bool ReplaceByLink(const std::string& temporary, const std::string& path, const FileStamp& expected,
+                   CommitResult& result) {
   const std::string aside = temporary + "~";
   if (linkat(AT_FDCWD, path.c_str(), AT_FDCWD, aside.c_str(), 0) != 0) return false;
   result = CommitResult::Taken;
@@ -58,7 +64,8 @@ bool ReplaceByLink(const std::string& temporary, const std::string& path, const 
 
 }  // namespace
 
-CommitResult ReplaceExpected(const std::string& temporary, const std::string& path, const FileStamp& expected, bool& keep) {
+CommitResult ReplaceExpected(const std::string& temporary, const std::string& path,
+                             const FileStamp& expected, bool& keep) {
   keep = false;
   if (!(StampOf(path) == expected)) return CommitResult::Taken;
   if (auto* const hook = beforeReplacing.load()) hook(path);
@@ -71,7 +78,8 @@ CommitResult ReplaceExpected(const std::string& temporary, const std::string& pa
   CommitResult result = CommitResult::Failed;
   if (first != ReplaceWay::Look && ReplaceByLink(temporary, path, expected, result)) return result;
   if (!(StampOf(path) == expected)) return CommitResult::Taken;
-  return std::rename(temporary.c_str(), path.c_str()) == 0 ? CommitResult::Done : CommitResult::Failed;
+  return std::rename(temporary.c_str(), path.c_str()) == 0 ? CommitResult::Done
+                                                           : CommitResult::Failed;
 }
 
 }  // namespace fotomill::platform

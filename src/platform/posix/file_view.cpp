@@ -25,15 +25,17 @@ constexpr uint64_t kMappedFrom = 256 * 1024;       // up to here one read is che
 constexpr uint64_t kDropStep = uint64_t{2} << 20;  // bytes given back at a time
 constexpr size_t kMostMappings = 256;
 
-// The mapped views. A mapping whose file was cut short raises SIGBUS when the lost part is touched; the handler puts
-// zero pages there and marks the view, so that one file cannot take the program down. Slots are only ever reused.
+// The mapped views. A mapping whose file was cut short raises SIGBUS when the lost part is touched;
+// the handler puts zero pages there and marks the view, so that one file cannot take the program
+// down. Slots are only ever reused.
 struct MappedRange {
   std::atomic<uintptr_t> begin{0};  // 0: the slot is free
   std::atomic<uintptr_t> end{0};    // up to the end of the last page
   std::atomic<bool> damaged{false};
 };
 MappedRange mappedRanges[kMostMappings];
-static_assert(std::atomic<uintptr_t>::is_always_lock_free, "the handler may only touch lock-free objects");
+static_assert(std::atomic<uintptr_t>::is_always_lock_free,
+              "the handler may only touch lock-free objects");
 struct sigaction previousAction;
 uintptr_t pageSize = 4096;
 
@@ -44,8 +46,8 @@ bool ReplaceLostPages(uintptr_t address) {
     if (begin == 0 || address < begin || address >= end) continue;
     const uintptr_t page = address & ~(pageSize - 1);
     range.damaged = true;
-    return mmap(reinterpret_cast<void*>(page), end - page, PROT_READ, MAP_PRIVATE | MAP_ANONYMOUS | MAP_FIXED, -1, 0) !=
-           MAP_FAILED;
+    return mmap(reinterpret_cast<void*>(page), end - page, PROT_READ,
+                MAP_PRIVATE | MAP_ANONYMOUS | MAP_FIXED, -1, 0) != MAP_FAILED;
   }
   return false;
 }
@@ -76,7 +78,8 @@ MappedRange* EnterRange(const void* data, uint64_t size) {
   for (MappedRange& range : mappedRanges) {
     if (range.begin != 0) continue;
     range.damaged = false;
-    range.end = (reinterpret_cast<uintptr_t>(data) + static_cast<uintptr_t>(size) + pageSize - 1) & ~(pageSize - 1);
+    range.end = (reinterpret_cast<uintptr_t>(data) + static_cast<uintptr_t>(size) + pageSize - 1) &
+                ~(pageSize - 1);
     range.begin = reinterpret_cast<uintptr_t>(data);
     return &range;
   }
@@ -115,8 +118,9 @@ bool FileView::OpenPart(const char* path, uint64_t most) {
   fileSize_ = static_cast<uint64_t>(facts.st_size);
   size_ = std::min(fileSize_, most);
   if (size_ >= kMappedFrom && Map()) return true;
-  const int64_t count =
-      FaultDue() || !copy_.Allocate(size_, Fill::Unset) ? -1 : ReadFully(static_cast<int>(handle_), copy_.Data(), size_, 0);
+  const int64_t count = FaultDue() || !copy_.Allocate(size_, Fill::Unset)
+                            ? -1
+                            : ReadFully(static_cast<int>(handle_), copy_.Data(), size_, 0);
   if (count < 0) {
     KeepErrno();
     Close();
@@ -129,7 +133,8 @@ bool FileView::OpenPart(const char* path, uint64_t most) {
 
 bool FileView::Map() {
   if (size_ > SIZE_MAX / 2 || FaultDue()) return false;
-  void* data = mmap(nullptr, static_cast<size_t>(size_), PROT_READ, MAP_PRIVATE, static_cast<int>(handle_), 0);
+  void* data = mmap(nullptr, static_cast<size_t>(size_), PROT_READ, MAP_PRIVATE,
+                    static_cast<int>(handle_), 0);
   if (data == MAP_FAILED) return false;
   InstallBusHandler();
   mapping_ = EnterRange(data, size_);
@@ -148,14 +153,16 @@ bool FileView::ReadAt(uint64_t offset, std::span<uint8_t> into) const {
     if (!into.empty()) std::memcpy(into.data(), data_ + offset, into.size());
     return true;
   }
-  const int64_t count =
-      FaultDue() ? -1 : ReadFully(static_cast<int>(handle_), into.data(), into.size(), static_cast<int64_t>(offset));
+  const int64_t count = FaultDue() ? -1
+                                   : ReadFully(static_cast<int>(handle_), into.data(), into.size(),
+                                               static_cast<int64_t>(offset));
   return count == static_cast<int64_t>(into.size());
 }
 
 void FileView::Close() {
   if (mapping_ != nullptr) {
-    static_cast<MappedRange*>(mapping_)->begin = 0;  // first: once unmapped, the addresses may be another view's
+    // first: once unmapped, the addresses may be another view's
+    static_cast<MappedRange*>(mapping_)->begin = 0;
     munmap(const_cast<uint8_t*>(data_), static_cast<size_t>(size_));
     mapping_ = nullptr;
   }
@@ -166,18 +173,21 @@ void FileView::Close() {
   size_ = fileSize_ = dropped_ = 0;
 }
 
-// The page in which a shortened file now ends reads as zeros without a signal, so its length is asked as well.
+// The page in which a shortened file now ends reads as zeros without a signal, so its length is
+// asked as well.
 bool FileView::Intact() const {
   if (mapping_ == nullptr) return true;
   struct stat facts;
-  return !static_cast<const MappedRange*>(mapping_)->damaged.load() && fstat(static_cast<int>(handle_), &facts) == 0 &&
+  return !static_cast<const MappedRange*>(mapping_)->damaged.load() &&
+         fstat(static_cast<int>(handle_), &facts) == 0 &&
          static_cast<uint64_t>(facts.st_size) >= size_;
 }
 
 void FileView::DropBefore(uint64_t offset) {
   const uint64_t end = std::min(offset, size_) & ~(kDropStep - 1);
   if (mapping_ == nullptr || end <= dropped_) return;
-  madvise(const_cast<uint8_t*>(data_) + dropped_, static_cast<size_t>(end - dropped_), MADV_DONTNEED);
+  madvise(const_cast<uint8_t*>(data_) + dropped_, static_cast<size_t>(end - dropped_),
+          MADV_DONTNEED);
   dropped_ = end;
 }
 

@@ -50,7 +50,8 @@ FolderEntry EntryOf(int folder, const dirent& entry) {
     result.link = S_ISLNK(facts.st_mode);
     result.kind = KindOf(facts.st_mode);
   }
-  if (result.link && fstatat(folder, entry.d_name, &facts, 0) == 0) result.kind = KindOf(facts.st_mode);
+  if (result.link && fstatat(folder, entry.d_name, &facts, 0) == 0)
+    result.kind = KindOf(facts.st_mode);
   return result;
 }
 
@@ -61,7 +62,10 @@ ReadResult ReadToEnd(int handle, uint64_t size, uint64_t most, std::string& cont
   for (;;) {
     room = std::min(room, most + 1);
     contents.resize(static_cast<size_t>(room));
-    const int64_t count = FaultDue() ? -1 : ReadFully(handle, reinterpret_cast<uint8_t*>(contents.data()) + done, room - done);
+    const int64_t count =
+        FaultDue()
+            ? -1
+            : ReadFully(handle, reinterpret_cast<uint8_t*>(contents.data()) + done, room - done);
     if (count < 0) return ReadResult::Failed;
     done += static_cast<uint64_t>(count);
     if (done > most) return ReadResult::TooLarge;
@@ -78,13 +82,15 @@ FileFacts FactsOf(const std::string& path) {
   constexpr unsigned kWanted = STATX_BASIC_STATS | STATX_BTIME;
   FileFacts facts;
   struct statx found;
-  if (statx(AT_FDCWD, path.c_str(), AT_STATX_SYNC_AS_STAT | AT_SYMLINK_NOFOLLOW, kWanted, &found) != 0) {
+  if (statx(AT_FDCWD, path.c_str(), AT_STATX_SYNC_AS_STAT | AT_SYMLINK_NOFOLLOW, kWanted, &found) !=
+      0) {
     facts.kind = NothingThere() ? FileKind::Missing : FileKind::Other;
     return facts;
   }
   facts.link = S_ISLNK(found.stx_mode);
   facts.kind = FileKind::Other;
-  if (facts.link && statx(AT_FDCWD, path.c_str(), AT_STATX_SYNC_AS_STAT, kWanted, &found) != 0) return facts;
+  if (facts.link && statx(AT_FDCWD, path.c_str(), AT_STATX_SYNC_AS_STAT, kWanted, &found) != 0)
+    return facts;
   facts.kind = KindOf(found.stx_mode);
   facts.size = found.stx_size;
   facts.modified = found.stx_mtime.tv_sec;
@@ -136,7 +142,8 @@ std::optional<std::vector<FolderEntry>> ListFolder(const std::string& path) {
     if (entries.back().kind == FileKind::Missing) entries.pop_back();
   }
   if (errno != 0) return std::nullopt;
-  std::sort(entries.begin(), entries.end(), [](const FolderEntry& a, const FolderEntry& b) { return a.name < b.name; });
+  std::sort(entries.begin(), entries.end(),
+            [](const FolderEntry& a, const FolderEntry& b) { return a.name < b.name; });
   return entries;
 }
 
@@ -176,7 +183,8 @@ CommitResult RenameFile(const std::string& from, const std::string& to, Existing
     result = RenameRefusing(from, to);
   } else {
     struct stat facts;
-    if (lstat(to.c_str(), &facts) == 0 && !S_ISREG(facts.st_mode) && !S_ISLNK(facts.st_mode)) return CommitResult::Failed;
+    if (lstat(to.c_str(), &facts) == 0 && !S_ISREG(facts.st_mode) && !S_ISLNK(facts.st_mode))
+      return CommitResult::Failed;
     if (std::rename(from.c_str(), to.c_str()) == 0) result = CommitResult::Done;
   }
   if (result == CommitResult::Failed) KeepErrno();
@@ -194,7 +202,8 @@ bool SetNormal(const std::string& path) {
   struct stat facts;
   if (lstat(path.c_str(), &facts) != 0) return false;
   if (!S_ISREG(facts.st_mode) || (facts.st_mode & S_IWUSR) != 0) return true;
-  return fchmodat(AT_FDCWD, path.c_str(), (facts.st_mode & 07777) | S_IWUSR, AT_SYMLINK_NOFOLLOW) == 0;
+  return fchmodat(AT_FDCWD, path.c_str(), (facts.st_mode & 07777) | S_IWUSR, AT_SYMLINK_NOFOLLOW) ==
+         0;
 }
 
 std::optional<ExactTime> ModificationTime(const std::string& path) {
@@ -222,7 +231,8 @@ ReadResult ReadWholeFile(const std::string& path, uint64_t most, std::string& co
     const bool missing = errno == ENOENT;
     if (!FileExists(path)) return ReadResult::Missing;
     if (!missing || attempt == kMostAppearances) return ReadResult::Failed;
-    handle = OpenRegular(path.c_str(), O_RDONLY, facts);  // someone has just made it, unless it is a link to nothing
+    // someone has just made it, unless it is a link to nothing
+    handle = OpenRegular(path.c_str(), O_RDONLY, facts);
   }
   const uint64_t size = static_cast<uint64_t>(facts.st_size);
   if (size > most) return ReadResult::TooLarge;
@@ -238,7 +248,8 @@ ReadResult ReadWholeFile(const std::string& path, uint64_t most, std::string& co
 
 bool WriteWholeFile(const std::string& path, std::string_view contents) {
   OutputFile file;
-  return file.Create(path) && file.Write({reinterpret_cast<const uint8_t*>(contents.data()), contents.size()}) &&
+  return file.Create(path) &&
+         file.Write({reinterpret_cast<const uint8_t*>(contents.data()), contents.size()}) &&
          file.Commit(Existing::Replace, true) == CommitResult::Done;
 }
 

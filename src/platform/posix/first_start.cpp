@@ -19,9 +19,10 @@
 #include "platform/clock.h"
 #include "platform/posix/handle.h"
 
-// The first start holds the lock of a file NAME.lock in a folder that only the user can enter, and listens at the socket NAME
-// beside it. Later ones send their message, end of sending is its end, and get a byte when it was taken. The lock goes with the
-// program that holds it, however that ends; the socket it leaves behind is replaced by the next one that gets the lock.
+// The first start holds the lock of a file NAME.lock in a folder that only the user can enter, and
+// listens at the socket NAME beside it. Later ones send their message, end of sending is its end,
+// and get a byte when it was taken. The lock goes with the program that holds it, however that
+// ends; the socket it leaves behind is replaced by the next one that gets the lock.
 
 namespace fotomill::platform {
 
@@ -34,7 +35,8 @@ constexpr char kTaken = 1;
 
 bool IsOwnFolder(const std::string& path) {
   struct stat facts = {};
-  return lstat(path.c_str(), &facts) == 0 && S_ISDIR(facts.st_mode) && facts.st_uid == geteuid() && (facts.st_mode & 077) == 0;
+  return lstat(path.c_str(), &facts) == 0 && S_ISDIR(facts.st_mode) && facts.st_uid == geteuid() &&
+         (facts.st_mode & 077) == 0;
 }
 
 // Empty when the system has no such folder.
@@ -54,7 +56,9 @@ std::optional<sockaddr_un> AddressOf(const std::string& path) {
   return address;
 }
 
-Handle MakeSocket() { return Handle(socket(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC | SOCK_NONBLOCK, 0)); }
+Handle MakeSocket() {
+  return Handle(socket(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC | SOCK_NONBLOCK, 0));
+}
 
 // Waits until the handle is ready, or the time has come.
 bool WaitFor(int handle, short events, double until) {
@@ -94,7 +98,8 @@ std::optional<std::string> Receive(int socket) {
 
 class Caller : public LaterStart {
  public:
-  Caller(Handle socket, std::string message) : socket_(std::move(socket)), message_(std::move(message)) {}
+  Caller(Handle socket, std::string message)
+      : socket_(std::move(socket)), message_(std::move(message)) {}
   const std::string& Message() const override { return message_; }
   bool Accept() override {
     // One that has given up has closed its end.
@@ -121,7 +126,9 @@ struct FirstStart::Place {
     if (!file.IsOpen() || flock(file.Number(), LOCK_EX | LOCK_NB) != 0) return false;
     // The one before may have deleted it between opening and locking.
     struct stat mine = {}, there = {};
-    if (fstat(file.Number(), &mine) != 0 || stat(lockPath.c_str(), &there) != 0 || mine.st_ino != there.st_ino) return false;
+    if (fstat(file.Number(), &mine) != 0 || stat(lockPath.c_str(), &there) != 0 ||
+        mine.st_ino != there.st_ino)
+      return false;
     lock = std::move(file);
     return true;
   }
@@ -134,7 +141,9 @@ struct FirstStart::Place {
     stopped.Reset(ends[0]);
     socket = MakeSocket();
     (void)unlink(socketPath.c_str());
-    return socket.IsOpen() && bind(socket.Number(), reinterpret_cast<const sockaddr*>(&*address), sizeof *address) == 0 &&
+    return socket.IsOpen() &&
+           bind(socket.Number(), reinterpret_cast<const sockaddr*>(&*address), sizeof *address) ==
+               0 &&
            listen(socket.Number(), SOMAXCONN) == 0;
   }
 
@@ -143,7 +152,8 @@ struct FirstStart::Place {
     const Handle line = MakeSocket();
     char answer = 0;
     return address && line.IsOpen() &&
-           connect(line.Number(), reinterpret_cast<const sockaddr*>(&*address), sizeof *address) == 0 &&
+           connect(line.Number(), reinterpret_cast<const sockaddr*>(&*address), sizeof *address) ==
+               0 &&
            Send(line.Number(), message, until) && WaitFor(line.Number(), POLLIN, until) &&
            recv(line.Number(), &answer, 1, 0) == 1 && answer == kTaken;
   }
@@ -163,7 +173,8 @@ FirstStart::~FirstStart() {
   if (listener_.joinable()) listener_.join();
 }
 
-FirstStart::Standing FirstStart::Begin(const std::string& name, const std::string& message, double seconds) {
+FirstStart::Standing FirstStart::Begin(const std::string& name, const std::string& message,
+                                       double seconds) {
   const std::string folder = RuntimeFolder();
   if (folder.empty() || message.size() > kMostMessage) return Standing::Alone;
   auto place = std::make_unique<Place>();
@@ -191,7 +202,8 @@ void FirstStart::Listen(std::function<void(std::shared_ptr<LaterStart> start)> c
       if (wanted[1].revents != 0) return;
       Handle line(accept4(place->socket.Number(), nullptr, nullptr, SOCK_CLOEXEC | SOCK_NONBLOCK));
       if (!line.IsOpen()) continue;
-      if (auto message = Receive(line.Number())) came(std::make_shared<Caller>(std::move(line), std::move(*message)));
+      if (auto message = Receive(line.Number()))
+        came(std::make_shared<Caller>(std::move(line), std::move(*message)));
     }
   };
   try {

@@ -22,7 +22,8 @@ std::string WithoutClosingSeparator(std::string path) {
   return path;
 }
 
-// A folder named by an environment variable; empty unless it is absolute, as the base directory specification asks.
+// A folder named by an environment variable; empty unless it is absolute, as the base directory
+// specification asks.
 std::string FolderFromEnvironment(const char* name) {
   const char* value = std::getenv(name);
   return value != nullptr && value[0] == '/' ? WithoutClosingSeparator(value) : std::string();
@@ -32,7 +33,8 @@ std::string FolderFromEnvironment(const char* name) {
 const passwd* PasswordEntry(passwd& entry, std::vector<char>& buffer) {
   passwd* found = nullptr;
   buffer.resize(4096);
-  while (getpwuid_r(getuid(), &entry, buffer.data(), buffer.size(), &found) == ERANGE && buffer.size() < (size_t{1} << 20)) {
+  while (getpwuid_r(getuid(), &entry, buffer.data(), buffer.size(), &found) == ERANGE &&
+         buffer.size() < (size_t{1} << 20)) {
     buffer.resize(buffer.size() * 2);
   }
   return found;
@@ -44,7 +46,8 @@ std::string HomeFolder() {
   passwd entry;
   std::vector<char> buffer;
   const passwd* const found = PasswordEntry(entry, buffer);
-  return found != nullptr && found->pw_dir[0] == '/' ? WithoutClosingSeparator(found->pw_dir) : std::string();
+  return found != nullptr && found->pw_dir[0] == '/' ? WithoutClosingSeparator(found->pw_dir)
+                                                     : std::string();
 }
 
 std::string FolderOrHomeChild(const char* variable, std::string_view child) {
@@ -54,7 +57,8 @@ std::string FolderOrHomeChild(const char* variable, std::string_view child) {
   return home.empty() ? home : JoinFolder(home, child);
 }
 
-// A value of user-dirs.dirs, as in  XDG_PICTURES_DIR="$HOME/Pictures" ; empty when it is not of that shape.
+// A value of user-dirs.dirs, as in  XDG_PICTURES_DIR="$HOME/Pictures" ; empty when it is not of
+// that shape.
 std::string UserFolderValue(std::string_view value, const std::string& home) {
   if (value.size() < 2 || value.front() != '"') return {};
   std::string text;
@@ -68,13 +72,14 @@ std::string UserFolderValue(std::string_view value, const std::string& home) {
   return text.starts_with('/') ? WithoutClosingSeparator(text) : std::string();
 }
 
-// A folder that the user named in user-dirs.dirs, else the one of the usual name where it exists, else home.
+// A folder that the user named in user-dirs.dirs, else the one of the usual name where it exists,
+// else home.
 std::string UserFolder(std::string_view key, std::string_view usualName) {
   const std::string home = HomeFolder();
   const std::string configuration = FolderOrHomeChild("XDG_CONFIG_HOME", ".config");
   std::string text, folder;
-  if (!configuration.empty() &&
-      ReadWholeFile(JoinFolder(configuration, "user-dirs.dirs"), kMostUserFolders, text) == ReadResult::Done) {
+  if (!configuration.empty() && ReadWholeFile(JoinFolder(configuration, "user-dirs.dirs"),
+                                              kMostUserFolders, text) == ReadResult::Done) {
     for (std::string_view rest = text; !rest.empty();) {
       std::string_view line = rest.substr(0, rest.find('\n'));
       rest.remove_prefix(std::min(line.size() + 1, rest.size()));
@@ -147,12 +152,15 @@ std::string ProgramPath() {
     }
     path.resize(path.size() * 2);
   }
-  constexpr std::string_view deleted = " (deleted)";  // what the system adds once the file was replaced by an update
+  // what the system adds once the file was replaced by an update
+  constexpr std::string_view deleted = " (deleted)";
   if (path.ends_with(deleted) && !FileExists(path)) path.resize(path.size() - deleted.size());
   return path;
 }
 
-std::string ProgramFolder() { return WithoutClosingSeparator(std::string(SplitPath(ProgramPath()).folder)); }
+std::string ProgramFolder() {
+  return WithoutClosingSeparator(std::string(SplitPath(ProgramPath()).folder));
+}
 
 std::string CurrentFolder() {
   std::string path(256, '\0');

@@ -16,14 +16,16 @@ std::atomic<RefusingRename> refusingRename{RefusingRename::Directly};
 
 namespace {
 
-constexpr uint64_t kMostAtOnce = uint64_t{1} << 30;  // one read or write; the system takes at most 2 GiB
+// one read or write; the system takes at most 2 GiB
+constexpr uint64_t kMostAtOnce = uint64_t{1} << 30;
 
-// Whether both names lead to one entry of a folder: one file with a single name, as "a.jpg" and "A.JPG" are where case
-// does not count.
+// Whether both names lead to one entry of a folder: one file with a single name, as "a.jpg" and
+// "A.JPG" are where case does not count.
 bool OneEntry(const std::string& from, const std::string& to) {
   struct stat first, second;
-  return lstat(from.c_str(), &first) == 0 && lstat(to.c_str(), &second) == 0 && first.st_dev == second.st_dev &&
-         first.st_ino == second.st_ino && first.st_nlink == 1 && from != to;
+  return lstat(from.c_str(), &first) == 0 && lstat(to.c_str(), &second) == 0 &&
+         first.st_dev == second.st_dev && first.st_ino == second.st_ino && first.st_nlink == 1 &&
+         from != to;
 }
 
 // The two ways below are for files: a folder has no hard links, and nothing else can hold its name.
@@ -52,7 +54,8 @@ CommitResult RenameOverPlaceholder(const std::string& from, const std::string& t
 bool Handle::Reset(int number) {
   const int old = number_;
   number_ = number;
-  return old < 0 || close(old) == 0 || errno == EINTR;  // interrupted: the descriptor is closed all the same
+  // interrupted: the descriptor is closed all the same
+  return old < 0 || close(old) == 0 || errno == EINTR;
 }
 
 Handle OpenHandle(const char* path, int flags, mode_t mode) {
@@ -81,7 +84,8 @@ int64_t ReadFully(int handle, uint8_t* data, uint64_t size, int64_t offset) {
   while (done < size) {
     const size_t part = static_cast<size_t>(std::min(size - done, kMostAtOnce));
     const ssize_t count =
-        offset < 0 ? read(handle, data + done, part) : pread(handle, data + done, part, offset + static_cast<int64_t>(done));
+        offset < 0 ? read(handle, data + done, part)
+                   : pread(handle, data + done, part, offset + static_cast<int64_t>(done));
     if (count < 0 && errno == EINTR) continue;
     if (count < 0) return -1;
     if (count == 0) break;
@@ -95,7 +99,8 @@ bool WriteFully(int handle, const uint8_t* data, uint64_t size, int64_t offset) 
   while (done < size) {
     const size_t part = static_cast<size_t>(std::min(size - done, kMostAtOnce));
     const ssize_t count =
-        offset < 0 ? write(handle, data + done, part) : pwrite(handle, data + done, part, offset + static_cast<int64_t>(done));
+        offset < 0 ? write(handle, data + done, part)
+                   : pwrite(handle, data + done, part, offset + static_cast<int64_t>(done));
     if (count < 0 && errno == EINTR) continue;
     if (count <= 0) return false;
     done += static_cast<uint64_t>(count);
@@ -125,7 +130,8 @@ CommitResult RenameRefusing(const std::string& from, const std::string& to) {
   const RefusingRename first = refusingRename;
   errno = ENOSYS;
   if (first == RefusingRename::Directly) {
-    if (renameat2(AT_FDCWD, from.c_str(), AT_FDCWD, to.c_str(), RENAME_NOREPLACE) == 0) return CommitResult::Done;
+    if (renameat2(AT_FDCWD, from.c_str(), AT_FDCWD, to.c_str(), RENAME_NOREPLACE) == 0)
+      return CommitResult::Done;
     if (errno == EEXIST && OneEntry(from, to)) {
       return std::rename(from.c_str(), to.c_str()) == 0 ? CommitResult::Done : CommitResult::Failed;
     }
@@ -134,7 +140,9 @@ CommitResult RenameRefusing(const std::string& from, const std::string& to) {
   }
   if (first != RefusingRename::ByPlaceholder) {
     const CommitResult result = RenameByLink(from, to);
-    if (result != CommitResult::Failed || (errno != EPERM && errno != EOPNOTSUPP && errno != ENOSYS)) return result;
+    if (result != CommitResult::Failed ||
+        (errno != EPERM && errno != EOPNOTSUPP && errno != ENOSYS))
+      return result;
   }
   return RenameOverPlaceholder(from, to);
 }

@@ -42,7 +42,8 @@ FileStamp StampOf(const std::string& path) {
   return stamp;
 }
 
-// Who waited for the lock may find that the file was replaced meanwhile, by the one that held it; then the new one is locked.
+// Who waited for the lock may find that the file was replaced meanwhile, by the one that held it;
+// then the new one is locked.
 bool HeldFile::Hold(const std::string& path) {
   Release();
   changed_ = false;
@@ -68,7 +69,9 @@ void HeldFile::Enter(const std::string& path) {
   held.files.push_back(this);
 }
 
-bool HeldFile::IsHeldAs(const std::string& path) const { return !path_.empty() && path_ == AbsolutePath(path); }
+bool HeldFile::IsHeldAs(const std::string& path) const {
+  return !path_.empty() && path_ == AbsolutePath(path);
+}
 
 void HeldFile::Release() {
   if (!path_.empty()) {
@@ -85,7 +88,8 @@ bool HeldFile::Find(const std::string& path, FileStamp& stamp) {
   const std::lock_guard lock(held.mutex);
   if (held.files.empty()) return false;
   const std::string absolute = AbsolutePath(path);
-  const auto found = std::ranges::find_if(held.files, [&](const HeldFile* file) { return file->path_ == absolute; });
+  const auto found = std::ranges::find_if(
+      held.files, [&](const HeldFile* file) { return file->path_ == absolute; });
   if (found != held.files.end()) stamp = (*found)->stamp_;
   return found != held.files.end();
 }

@@ -25,19 +25,23 @@ std::string LineOf(const std::string& path) {
 
 }  // namespace
 
-// /proc/locks has lines such as "3: FLOCK  ADVISORY  WRITE 123 08:01:4567 0 EOF", with the file's number behind its device;
-// some file systems give another device there than to the file itself, so that only the number counts.
+// /proc/locks has lines such as "3: FLOCK  ADVISORY  WRITE 123 08:01:4567 0 EOF", with the file's
+// number behind its device; some file systems give another device there than to the file itself, so
+// that only the number counts.
 std::string LockHolder(int handle) {
   struct stat facts;
   std::string text;
-  if (fstat(handle, &facts) != 0 || ReadWholeFile("/proc/locks", kMostText, text) != ReadResult::Done) return kUnknown;
+  if (fstat(handle, &facts) != 0 ||
+      ReadWholeFile("/proc/locks", kMostText, text) != ReadResult::Done)
+    return kUnknown;
   for (size_t at = 0; at < text.size();) {
     const size_t end = text.find('\n', at);
     const std::string line = text.substr(at, end - at);
     at = end == std::string::npos ? text.size() : end + 1;
     int process = 0;
     unsigned long long number = 0;
-    if (std::sscanf(line.c_str(), "%*d: FLOCK %*s %*s %d %*x:%*x:%llu", &process, &number) != 2) continue;
+    if (std::sscanf(line.c_str(), "%*d: FLOCK %*s %*s %d %*x:%*x:%llu", &process, &number) != 2)
+      continue;
     if (number != facts.st_ino || process <= 0) continue;
     const std::string name = LineOf("/proc/" + std::to_string(process) + "/comm");
     const std::string which = "process " + std::to_string(process);
@@ -48,7 +52,8 @@ std::string LockHolder(int handle) {
 
 std::string PathOfHandle(int handle) {
   char path[PATH_MAX];
-  const ssize_t count = readlink(("/proc/self/fd/" + std::to_string(handle)).c_str(), path, sizeof path);
+  const ssize_t count =
+      readlink(("/proc/self/fd/" + std::to_string(handle)).c_str(), path, sizeof path);
   return count > 0 ? std::string(path, static_cast<size_t>(count)) : std::string();
 }
 

@@ -34,8 +34,8 @@ constexpr size_t kPooledBlocks = 16;
 constexpr uint64_t kPooledBytes = uint64_t{512} << 20;
 
 #ifdef FOTOMILL_ADDRESS_SANITIZER
-// Mapped blocks are unknown to the sanitizer: it is told which of their bytes may be touched, and each has some to spare
-// behind its end.
+// Mapped blocks are unknown to the sanitizer: it is told which of their bytes may be touched, and
+// each has some to spare behind its end.
 constexpr uint64_t kGuard = 4096;
 void AllowBytes(const uint8_t* data, uint64_t size, uint64_t capacity) {
   __asan_unpoison_memory_region(data, size);
@@ -51,7 +51,8 @@ struct FreeBlock {
   uint64_t capacity;
 };
 
-// Blocks that wait for their next owner, the oldest first. Plain data, so that it outlives every block of a static.
+// Blocks that wait for their next owner, the oldest first. Plain data, so that it outlives every
+// block of a static.
 struct BlockPool {
   std::mutex mutex;
   FreeBlock blocks[kPooledBlocks];
@@ -70,7 +71,9 @@ constinit BlockPool pool{};
 
 uint64_t RoundUp(uint64_t size, uint64_t unit) { return (size + unit - 1) / unit * unit; }
 
-uint64_t CapacityFor(uint64_t size) { return RoundUp(size + kGuard, size >= 2 * kHugePage ? kHugePage : kSmallUnit); }
+uint64_t CapacityFor(uint64_t size) {
+  return RoundUp(size + kGuard, size >= 2 * kHugePage ? kHugePage : kSmallUnit);
+}
 
 void Unmap(FreeBlock block) {
   AllowBytes(block.data, block.capacity, block.capacity);
@@ -90,7 +93,8 @@ void ShrinkPool(uint64_t bytes) {
   }
 }
 
-// The smallest pooled block that is large enough without being wasteful; data is null if there is none.
+// The smallest pooled block that is large enough without being wasteful; data is null if there is
+// none.
 FreeBlock TakeFromPool(uint64_t capacity) {
   const std::lock_guard lock(pool.mutex);
   size_t best = pool.count;
@@ -116,14 +120,17 @@ void GiveToPool(FreeBlock block) {
   Unmap(block);
 }
 
-// Fresh zero pages, asked to be huge ones where the block is worth it. What waits in the pool and did not fit counts
-// against what the pool may hold, so that one large picture after many small ones does not have both.
+// Fresh zero pages, asked to be huge ones where the block is worth it. What waits in the pool and
+// did not fit counts against what the pool may hold, so that one large picture after many small
+// ones does not have both.
 FreeBlock MapFresh(uint64_t capacity) {
   ShrinkPool(kPooledBytes - std::min(capacity, kPooledBytes));
-  void* data = mmap(nullptr, static_cast<size_t>(capacity), PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
+  void* data = mmap(nullptr, static_cast<size_t>(capacity), PROT_READ | PROT_WRITE,
+                    MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
   if (data == MAP_FAILED) {
     ShrinkPool(0);
-    data = mmap(nullptr, static_cast<size_t>(capacity), PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
+    data = mmap(nullptr, static_cast<size_t>(capacity), PROT_READ | PROT_WRITE,
+                MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
   }
   if (data == MAP_FAILED) return {nullptr, 0};
   if (capacity >= 2 * kHugePage) madvise(data, static_cast<size_t>(capacity), MADV_HUGEPAGE);
@@ -166,7 +173,8 @@ bool MemoryBlock::Allocate(uint64_t size, Fill fill) {
 }
 
 bool MemoryBlock::Resize(uint64_t size) {
-  const bool staysInPlace = size >= kPooledFrom && size + kGuard <= capacity_ && capacity_ / 2 <= CapacityFor(size);
+  const bool staysInPlace =
+      size >= kPooledFrom && size + kGuard <= capacity_ && capacity_ / 2 <= CapacityFor(size);
   if (staysInPlace && !FaultDue()) {
     AllowBytes(data_, size, capacity_);
     if (size > size_) std::memset(data_ + size_, 0, static_cast<size_t>(size - size_));

@@ -48,9 +48,10 @@ bool IsOctalDigit(char c) { return c >= '0' && c <= '7'; }
 std::string DecodeOctal(std::string_view text) {
   std::string result;
   for (size_t i = 0; i < text.size(); ++i) {
-    if (text[i] == '\\' && i + 3 < text.size() && IsOctalDigit(text[i + 1]) && IsOctalDigit(text[i + 2]) &&
-        IsOctalDigit(text[i + 3])) {
-      result += static_cast<char>((text[i + 1] - '0') << 6 | (text[i + 2] - '0') << 3 | (text[i + 3] - '0'));
+    if (text[i] == '\\' && i + 3 < text.size() && IsOctalDigit(text[i + 1]) &&
+        IsOctalDigit(text[i + 2]) && IsOctalDigit(text[i + 3])) {
+      result += static_cast<char>((text[i + 1] - '0') << 6 | (text[i + 2] - '0') << 3 |
+                                  (text[i + 3] - '0'));
       i += 3;
     } else {
       result += text[i];
@@ -85,7 +86,8 @@ std::string DeviceName(const Mount& mount, const std::string& root) {
   const std::string known = LinkTarget(root + "/sys/dev/block/" + mount.device);
   if (!known.empty()) return std::string(FileNameOf(known));
   if (!mount.source.starts_with("/dev/")) return {};
-  const std::unique_ptr<char, decltype(&free)> real(realpath((root + mount.source).c_str(), nullptr), free);
+  const std::unique_ptr<char, decltype(&free)> real(
+      realpath((root + mount.source).c_str(), nullptr), free);
   return std::string(FileNameOf(real != nullptr ? real.get() : mount.source));
 }
 
@@ -94,13 +96,15 @@ std::string NameAmong(const std::string& folder, const std::string& device) {
   const auto entries = ListFolder(folder);
   if (!entries || device.empty()) return {};
   for (const FolderEntry& entry : *entries) {
-    if (entry.link && FileNameOf(LinkTarget(JoinFolder(folder, entry.name))) == device) return DecodeHex(entry.name);
+    if (entry.link && FileNameOf(LinkTarget(JoinFolder(folder, entry.name))) == device)
+      return DecodeHex(entry.name);
   }
   return {};
 }
 
-// A 32-bit number from the identity that a file system carries: "1A2B-3C4D" of FAT and exFAT is that number, of NTFS's 16
-// digits it is the lower half, as Windows shows them. Longer ones are folded (FNV-1a).
+// A 32-bit number from the identity that a file system carries: "1A2B-3C4D" of FAT and exFAT is
+// that number, of NTFS's 16 digits it is the lower half, as Windows shows them. Longer ones are
+// folded (FNV-1a).
 uint32_t SerialFrom(std::string_view identity) {
   uint64_t number = 0;
   size_t digits = 0;
@@ -109,17 +113,21 @@ uint32_t SerialFrom(std::string_view identity) {
     number = number << 4 | static_cast<unsigned>(HexDigit(c));
     ++digits;
   }
-  if ((digits == 8 && identity.size() == 9) || (digits == 16 && identity.size() == 16)) return static_cast<uint32_t>(number);
+  if ((digits == 8 && identity.size() == 9) || (digits == 16 && identity.size() == 16))
+    return static_cast<uint32_t>(number);
   uint32_t hash = 2166136261;
   for (const char c : identity) hash = (hash ^ static_cast<uint8_t>(c)) * 16777619;
   return hash;
 }
 
 DriveKind KindFrom(const Mount& mount, const std::string& device, const std::string& root) {
-  const auto row = std::find_if(std::begin(typeRows), std::end(typeRows), [&](const TypeRow& r) { return r.type == mount.type; });
-  if (row != std::end(typeRows) && (device.empty() || row->kind != DriveKind::Fixed)) return row->kind;
+  const auto row = std::find_if(std::begin(typeRows), std::end(typeRows),
+                                [&](const TypeRow& r) { return r.type == mount.type; });
+  if (row != std::end(typeRows) && (device.empty() || row->kind != DriveKind::Fixed))
+    return row->kind;
   if (device.empty()) return DriveKind::Unknown;
-  if (mount.device.starts_with("11:")) return DriveKind::Optical;  // SCSI and SATA drives for disks of light
+  // SCSI and SATA drives for disks of light
+  if (mount.device.starts_with("11:")) return DriveKind::Optical;
   if (mount.device.starts_with("1:")) return DriveKind::Ram;
   const std::string folder = root + "/sys/class/block/" + device;
   std::string flag;
@@ -143,11 +151,14 @@ std::vector<Mount> ParseMountTable(std::string_view text) {
       words.push_back(line.substr(0, line.find(' ')));
       line.remove_prefix(std::min(words.back().size() + 1, line.size()));
     }
-    const auto dash = std::find(words.size() > 6 ? words.begin() + 6 : words.end(), words.end(), "-");
+    const auto dash =
+        std::find(words.size() > 6 ? words.begin() + 6 : words.end(), words.end(), "-");
     if (words.end() - dash < 3) continue;
-    Mount mount{0, std::string(words[2]), DecodeOctal(dash[1]), DecodeOctal(dash[2]), DecodeOctal(words[4])};
+    Mount mount{0, std::string(words[2]), DecodeOctal(dash[1]), DecodeOctal(dash[2]),
+                DecodeOctal(words[4])};
     const char* end = words[0].data() + words[0].size();
-    if (std::from_chars(words[0].data(), end, mount.id).ptr == end) mounts.push_back(std::move(mount));
+    if (std::from_chars(words[0].data(), end, mount.id).ptr == end)
+      mounts.push_back(std::move(mount));
   }
   return mounts;
 }
@@ -169,8 +180,8 @@ std::vector<std::string> UserVolumesAmong(const std::vector<Mount>& mounts) {
 Volume DescribeMount(const Mount& mount, uint32_t fileSystemId, const std::string& root) {
   const std::string device = DeviceName(mount, root);
   const std::string identity = NameAmong(root + "/dev/disk/by-uuid", device);
-  return {true, NameAmong(root + "/dev/disk/by-label", device), identity.empty() ? fileSystemId : SerialFrom(identity),
-          KindFrom(mount, device, root)};
+  return {true, NameAmong(root + "/dev/disk/by-label", device),
+          identity.empty() ? fileSystemId : SerialFrom(identity), KindFrom(mount, device, root)};
 }
 
 }  // namespace fotomill::platform

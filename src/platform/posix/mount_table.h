@@ -24,8 +24,9 @@ std::vector<Mount> ParseMountTable(std::string_view text);
 // Where volumes of the user are mounted: drives that were plugged in, discs, shares. In order.
 std::vector<std::string> UserVolumesAmong(const std::vector<Mount>& mounts);
 
-// What label, number and kind a mount has, read from the trees /dev/disk and /sys below `root` (empty: the system's own).
-// `fileSystemId` stands in as the number where the device has none on record.
+// What label, number and kind a mount has, read from the trees /dev/disk and /sys below `root`
+// (empty: the system's own). `fileSystemId` stands in as the number where the device has none on
+// record.
 Volume DescribeMount(const Mount& mount, uint32_t fileSystemId, const std::string& root);
 
 }  // namespace fotomill::platform

@@ -33,7 +33,8 @@ namespace {
 constexpr int kAttempts = 100;
 constexpr size_t kCopyStep = size_t{1} << 30;
 
-// ".fmw-OWNER-N.tmp" beside the destination: hidden, short, and unique within this machine and process.
+// ".fmw-OWNER-N.tmp" beside the destination: hidden, short, and unique within this machine and
+// process.
 std::string TemporarySibling(const std::string& path) {
   static std::atomic<unsigned> counter{0};
   char name[64];
@@ -56,7 +57,8 @@ bool NameUnnamed(int handle, const std::string& path) {
     errno = EPERM;
     return false;
   }
-  return linkat(AT_FDCWD, HandlePath(handle).c_str(), AT_FDCWD, path.c_str(), AT_SYMLINK_FOLLOW) == 0;
+  return linkat(AT_FDCWD, HandlePath(handle).c_str(), AT_FDCWD, path.c_str(), AT_SYMLINK_FOLLOW) ==
+         0;
 }
 
 // Reports errors that the kernel delays until close(), without closing the file.
@@ -65,21 +67,22 @@ bool CloseCopyOf(int handle) {
   return copy.IsOpen() && copy.Reset();
 }
 
-// Whether a link may be replaced: one to a regular file, or to nothing. Others are the system's or stand for a place, and so do
-// those that name an open file, as /dev/stdout does.
+// Whether a link may be replaced: one to a regular file, or to nothing. Others are the system's or
+// stand for a place, and so do those that name an open file, as /dev/stdout does.
 bool MayReplaceLink(const std::string& path) {
   constexpr std::string_view kOpenFiles = "/proc/";
   char target[kOpenFiles.size()];
   const ssize_t count = readlink(path.c_str(), target, sizeof target);
   struct stat facts;
-  const bool replaceable = count >= 0 && std::string_view(target, static_cast<size_t>(count)) != kOpenFiles &&
+  const bool replaceable = count >= 0 &&
+                           std::string_view(target, static_cast<size_t>(count)) != kOpenFiles &&
                            (stat(path.c_str(), &facts) != 0 || S_ISREG(facts.st_mode));
   if (!replaceable) errno = EINVAL;
   return replaceable;
 }
 
-// Whether `path` may become a file: free, a link that may be replaced, or a regular file that may be written to, whose
-// permissions then go to `mode`. False with errno.
+// Whether `path` may become a file: free, a link that may be replaced, or a regular file that may
+// be written to, whose permissions then go to `mode`. False with errno.
 bool MayBecome(const std::string& path, mode_t& mode) {
   struct stat facts;
   if (lstat(path.c_str(), &facts) != 0) return errno == ENOENT;
@@ -124,7 +127,8 @@ bool OutputFile::CreateNamedSibling(unsigned mode) {
   DeleteStaleFiles(OpenableFolderOf(path_));
   for (int attempt = 0; attempt < kAttempts; ++attempt) {
     std::string name = TemporarySibling(path_);
-    const int handle = OpenHandle(name.c_str(), O_RDWR | O_CREAT | O_EXCL | O_NOFOLLOW, mode).Release();
+    const int handle =
+        OpenHandle(name.c_str(), O_RDWR | O_CREAT | O_EXCL | O_NOFOLLOW, mode).Release();
     if (handle < 0 && errno == EEXIST) continue;
     if (handle < 0) return false;
     if (handle_ >= 0) close(handle_);
@@ -158,8 +162,10 @@ CommitResult OutputFile::Commit(Existing existing, bool sync) {
   struct stat facts;
   const bool there = lstat(path_.c_str(), &facts) == 0;
   const bool replaces = existing == Existing::Replace && there;
-  failed_ = failed_ || (replaces && !S_ISREG(facts.st_mode) && !(S_ISLNK(facts.st_mode) && MayReplaceLink(path_)));
-  if (replaces && !failed_ && S_ISREG(facts.st_mode)) KeepLostAttributes(CopyAttributes(path_, facts, handle_));
+  failed_ = failed_ || (replaces && !S_ISREG(facts.st_mode) &&
+                        !(S_ISLNK(facts.st_mode) && MayReplaceLink(path_)));
+  if (replaces && !failed_ && S_ISREG(facts.st_mode))
+    KeepLostAttributes(CopyAttributes(path_, facts, handle_));
   bool synced = sync || replaces;
   if (synced && !failed_) {
     failed_ = FaultDue() || !SyncHandle(handle_);
@@ -193,7 +199,8 @@ CommitResult OutputFile::TakeName(Existing existing, bool replaces, bool& synced
   }
   if (FaultDue()) return CommitResult::Failed;
   if (!held) {
-    return std::rename(temporary_.c_str(), path_.c_str()) == 0 ? CommitResult::Done : CommitResult::Failed;
+    return std::rename(temporary_.c_str(), path_.c_str()) == 0 ? CommitResult::Done
+                                                               : CommitResult::Failed;
   }
   LeaveTemporaryName(listed_);  // it may soon be the name of what another program has written
   listed_ = -1;

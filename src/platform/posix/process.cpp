@@ -31,7 +31,8 @@ namespace fotomill::platform {
 namespace {
 
 std::atomic<int> pendingExit{0};
-static_assert(std::atomic<int>::is_always_lock_free, "the handler may only touch lock-free objects");
+static_assert(std::atomic<int>::is_always_lock_free,
+              "the handler may only touch lock-free objects");
 
 void OnTermination(int signalNumber) {
   int none = 0;
@@ -41,7 +42,9 @@ void OnTermination(int signalNumber) {
   raise(signalNumber);  // delivered when this handler returns
 }
 
-bool IsProgram(const std::string& path) { return IsRegularFile(path) && access(path.c_str(), X_OK) == 0; }
+bool IsProgram(const std::string& path) {
+  return IsRegularFile(path) && access(path.c_str(), X_OK) == 0;
+}
 
 // The file of a program given by name or path; empty if there is none.
 std::string FindProgram(const std::string& name) {
@@ -91,7 +94,8 @@ struct SpawnSettings {
 std::vector<std::string> ProgramFor(const std::string& file) {
   std::string opener = FindProgram("xdg-open");  // asks the desktop for the file type's own program
   if (opener.empty()) return {};
-  return {std::move(opener), AbsolutePath(file)};  // absolute: a name may begin with "-" or read like an address
+  // absolute: a name may begin with "-" or read like an address
+  return {std::move(opener), AbsolutePath(file)};
 }
 
 bool RunProgram(const std::vector<std::string>& arguments, bool wait) {
@@ -99,12 +103,15 @@ bool RunProgram(const std::vector<std::string>& arguments, bool wait) {
   const std::string program = FindProgram(arguments[0]);
   if (program.empty()) return false;
   std::vector<char*> vector;
-  for (const std::string& argument : arguments) vector.push_back(const_cast<char*>(argument.c_str()));
+  for (const std::string& argument : arguments)
+    vector.push_back(const_cast<char*>(argument.c_str()));
   vector.push_back(nullptr);
   SpawnSettings settings;
   if (!wait) settings.Detach();
   pid_t child;
-  if (posix_spawn(&child, program.c_str(), &settings.actions, &settings.attributes, vector.data(), environ) != 0) return false;
+  if (posix_spawn(&child, program.c_str(), &settings.actions, &settings.attributes, vector.data(),
+                  environ) != 0)
+    return false;
   if (wait) {
     WaitFor(child);
     return true;
@@ -118,7 +125,8 @@ bool RunProgram(const std::vector<std::string>& arguments, bool wait) {
 
 void FillStandardStreams() {
   for (const int stream : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO}) {
-    // A file for reading gets the lowest free number, and whoever writes there is told that it failed.
+    // A file for reading gets the lowest free number, and whoever writes there is told that it
+    // failed.
     if (fcntl(stream, F_GETFD) < 0) (void)open("/dev/null", O_RDONLY);
   }
 }
@@ -146,7 +154,9 @@ bool ShowTyping(bool show) {
   return tcsetattr(STDIN_FILENO, TCSAFLUSH, &modes) == 0;
 }
 
-void SetVariable(const char* name, const std::string& value) { (void)setenv(name, value.c_str(), 1); }
+void SetVariable(const char* name, const std::string& value) {
+  (void)setenv(name, value.c_str(), 1);
+}
 
 int TerminalWidth() {
   for (const int stream : {STDERR_FILENO, STDOUT_FILENO}) {
@@ -160,7 +170,8 @@ int TerminalWidth() {
 
 unsigned CoreCount() {
   cpu_set_t cores;
-  if (sched_getaffinity(0, sizeof cores, &cores) == 0 && CPU_COUNT(&cores) > 0) return static_cast<unsigned>(CPU_COUNT(&cores));
+  if (sched_getaffinity(0, sizeof cores, &cores) == 0 && CPU_COUNT(&cores) > 0)
+    return static_cast<unsigned>(CPU_COUNT(&cores));
   const unsigned count = std::thread::hardware_concurrency();
   return count > 0 ? count : 1;
 }

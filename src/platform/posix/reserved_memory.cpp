@@ -18,7 +18,8 @@ ReservedMemory& ReservedMemory::operator=(ReservedMemory&& other) noexcept {
 bool ReservedMemory::Reserve(uint64_t size) {
   if (size == 0 || size > SIZE_MAX / 2 || FaultDue()) return false;
   const auto bytes = static_cast<size_t>(size);
-  void* data = mmap(nullptr, bytes, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS | MAP_NORESERVE, -1, 0);
+  void* data = mmap(nullptr, bytes, PROT_READ | PROT_WRITE,
+                    MAP_PRIVATE | MAP_ANONYMOUS | MAP_NORESERVE, -1, 0);
   if (data == MAP_FAILED) return false;
 #ifdef MADV_NOHUGEPAGE
   madvise(data, bytes, MADV_NOHUGEPAGE);  // one touched byte would take two megabytes

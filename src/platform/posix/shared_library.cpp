@@ -13,7 +13,8 @@ const char* const kModuleExtension = ".so";
 
 namespace {
 
-// Everything is bound now, so that a missing symbol fails here and not inside a picture; nothing of it serves others.
+// Everything is bound now, so that a missing symbol fails here and not inside a picture; nothing of
+// it serves others.
 void* Open(const char* name, std::string& error) {
   if (FaultDue()) {
     error = "cannot be loaded";
@@ -65,7 +66,9 @@ bool SharedLibrary::LoadSystem(const std::string& name) {
   return Loaded();
 }
 
-void* SharedLibrary::Symbol(const char* name) const { return Loaded() ? dlsym(handle_, name) : nullptr; }
+void* SharedLibrary::Symbol(const char* name) const {
+  return Loaded() ? dlsym(handle_, name) : nullptr;
+}
 
 void SharedLibrary::Unload() {
   if (Loaded()) dlclose(std::exchange(handle_, nullptr));

@@ -21,13 +21,15 @@ namespace fotomill::platform {
 
 namespace {
 
-// Process numbers say nothing in another space of them, as a container with the same temporary folder has.
+// Process numbers say nothing in another space of them, as a container with the same temporary
+// folder has.
 unsigned ProcessSpace() {
   struct stat facts;
   return stat("/proc/self/ns/pid", &facts) == 0 ? static_cast<unsigned>(facts.st_ino & 0xFFFF) : 0;
 }
 
-// Whether a name is a temporary one of a process that has ended: ".fmw-PID-SPACE-N.tmp", "FMWTPID-SPACE-N.EXT".
+// Whether a name is a temporary one of a process that has ended: ".fmw-PID-SPACE-N.tmp",
+// "FMWTPID-SPACE-N.EXT".
 bool IsOfEndedProcess(const char* name) {
   unsigned process = 0, space = 0;
   char separator = 0;
@@ -35,7 +37,8 @@ bool IsOfEndedProcess(const char* name) {
       std::sscanf(name, "FMWT%x-%x%c", &process, &space, &separator) != 3) {
     return false;
   }
-  return separator == '-' && process > 0 && space == ProcessSpace() && kill(static_cast<pid_t>(process), 0) != 0 && errno == ESRCH;
+  return separator == '-' && process > 0 && space == ProcessSpace() &&
+         kill(static_cast<pid_t>(process), 0) != 0 && errno == ESRCH;
 }
 
 }  // namespace
@@ -53,15 +56,19 @@ void DeleteStaleFiles(const std::string& folder) {
     const std::lock_guard lock(mutex);
     if (!cleaned.insert(folder).second) return;
   }
-  const std::unique_ptr<DIR, int (*)(DIR*)> entries(opendir(folder.empty() ? "." : folder.c_str()), closedir);
+  const std::unique_ptr<DIR, int (*)(DIR*)> entries(opendir(folder.empty() ? "." : folder.c_str()),
+                                                    closedir);
   if (entries == nullptr) return;
   while (const dirent* entry = readdir(entries.get())) {
     const std::string_view name = entry->d_name;
-    if ((!name.starts_with(".fmw-") && !name.starts_with("FMWT")) || !IsOfEndedProcess(entry->d_name)) continue;
+    if ((!name.starts_with(".fmw-") && !name.starts_with("FMWT")) ||
+        !IsOfEndedProcess(entry->d_name))
+      continue;
     struct stat facts;
     const std::string path = JoinFolder(folder, name);
     const Handle file = OpenRegular(path.c_str(), O_RDONLY | O_NOFOLLOW, facts);
-    if (!file.IsOpen() || facts.st_uid != geteuid() || flock(file.Number(), LOCK_EX | LOCK_NB) != 0) continue;
+    if (!file.IsOpen() || facts.st_uid != geteuid() || flock(file.Number(), LOCK_EX | LOCK_NB) != 0)
+      continue;
     unlink(path.c_str());
   }
 }

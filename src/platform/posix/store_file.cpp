@@ -30,23 +30,32 @@ constexpr std::chrono::microseconds kFirstPause{100};
 constexpr std::chrono::microseconds kLongestPause{10'000};
 constexpr std::chrono::seconds kSilentWait{2};   // then whose lock it is gets told
 constexpr std::chrono::seconds kLongestWait{10};
-constexpr off_t kUseMark = off_t{1} << 62;       // a byte that no file has, for the lock that says it is in use
+// a byte that no file has, for the lock that says it is in use
+constexpr off_t kUseMark = off_t{1} << 62;
 
-// Whether an open failed because there is nothing of that name. A link that leads nowhere is something; a file that has
-// come since then is not asked for, or who creates and removes files side by side would meet errors that are none.
+// Whether an open failed because there is nothing of that name. A link that leads nowhere is
+// something; a file that has come since then is not asked for, or who creates and removes files
+// side by side would meet errors that are none.
 bool IsNoName(const std::string& path, int error) {
   struct stat facts;
-  return (error == ENOENT || error == ENOTDIR) && (lstat(path.c_str(), &facts) != 0 || !S_ISLNK(facts.st_mode));
+  return (error == ENOENT || error == ENOTDIR) &&
+         (lstat(path.c_str(), &facts) != 0 || !S_ISLNK(facts.st_mode));
 }
 
-int64_t Nanoseconds(const struct stat& facts) { return int64_t{facts.st_mtim.tv_sec} * 1'000'000'000 + facts.st_mtim.tv_nsec; }
+int64_t Nanoseconds(const struct stat& facts) {
+  return int64_t{facts.st_mtim.tv_sec} * 1'000'000'000 + facts.st_mtim.tv_nsec;
+}
 
-bool InRange(uint64_t offset, size_t size) { return offset <= INT64_MAX && size <= INT64_MAX - offset; }
+bool InRange(uint64_t offset, size_t size) {
+  return offset <= INT64_MAX && size <= INT64_MAX - offset;
+}
 
 }  // namespace
 
 StoreFile::StoreFile(StoreFile&& other) noexcept
-    : handle_(std::exchange(other.handle_, -1)), device_(other.device_), identity_(other.identity_) {}
+    : handle_(std::exchange(other.handle_, -1)),
+      device_(other.device_),
+      identity_(other.identity_) {}
 
 StoreFile& StoreFile::operator=(StoreFile&& other) noexcept {
   if (this != &other) {
@@ -97,30 +106,38 @@ int64_t StoreFile::Modified() const {
 
 bool StoreFile::ReadAt(uint64_t offset, std::span<uint8_t> bytes) const {
   if (!IsOpen() || !InRange(offset, bytes.size()) || FaultDue()) return false;
-  return ReadFully(static_cast<int>(handle_), bytes.data(), bytes.size(), static_cast<int64_t>(offset)) ==
-         static_cast<int64_t>(bytes.size());
+  return ReadFully(static_cast<int>(handle_), bytes.data(), bytes.size(),
+                   static_cast<int64_t>(offset)) == static_cast<int64_t>(bytes.size());
 }
 
 bool StoreFile::WriteAt(uint64_t offset, std::span<const uint8_t> bytes) {
   if (!IsOpen() || !InRange(offset, bytes.size()) || FaultDue()) return false;
-  return WriteFully(static_cast<int>(handle_), bytes.data(), bytes.size(), static_cast<int64_t>(offset));
+  return WriteFully(static_cast<int>(handle_), bytes.data(), bytes.size(),
+                    static_cast<int64_t>(offset));
 }
 
 bool StoreFile::ReadAt(uint64_t offset, std::span<uint8_t> first, std::span<uint8_t> second) const {
   const size_t size = first.size() + second.size();
   if (!IsOpen() || !InRange(offset, size) || FaultDue()) return false;
   const iovec parts[] = {{first.data(), first.size()}, {second.data(), second.size()}};
-  if (preadv(static_cast<int>(handle_), parts, 2, static_cast<off_t>(offset)) == static_cast<ssize_t>(size)) return true;
-  return ReadAt(offset, first) && ReadAt(offset + first.size(), second);  // it was interrupted, or the file ends there
+  if (preadv(static_cast<int>(handle_), parts, 2, static_cast<off_t>(offset)) ==
+      static_cast<ssize_t>(size))
+    return true;
+  // it was interrupted, or the file ends there
+  return ReadAt(offset, first) && ReadAt(offset + first.size(), second);
 }
 
-bool StoreFile::WriteAt(uint64_t offset, std::span<const uint8_t> first, std::span<const uint8_t> second) {
+bool StoreFile::WriteAt(uint64_t offset, std::span<const uint8_t> first,
+                        std::span<const uint8_t> second) {
   const size_t size = first.size() + second.size();
   if (!IsOpen() || !InRange(offset, size) || FaultDue()) return false;
   const iovec parts[] = {{const_cast<uint8_t*>(first.data()), first.size()},
                          {const_cast<uint8_t*>(second.data()), second.size()}};
-  if (pwritev(static_cast<int>(handle_), parts, 2, static_cast<off_t>(offset)) == static_cast<ssize_t>(size)) return true;
-  return WriteAt(offset, first) && WriteAt(offset + first.size(), second);  // it was interrupted, or there is no room
+  if (pwritev(static_cast<int>(handle_), parts, 2, static_cast<off_t>(offset)) ==
+      static_cast<ssize_t>(size))
+    return true;
+  // it was interrupted, or there is no room
+  return WriteAt(offset, first) && WriteAt(offset + first.size(), second);
 }
 
 bool StoreFile::Sync() { return IsOpen() && !FaultDue() && SyncHandle(static_cast<int>(handle_)); }
@@ -142,7 +159,9 @@ bool StoreFile::Lock() {
     }
     if (waited > kSilentWait && !told) {
       told = true;
-      if (onLongLockWait) onLongLockWait(PathOfHandle(static_cast<int>(handle_)), LockHolder(static_cast<int>(handle_)));
+      if (onLongLockWait)
+        onLongLockWait(PathOfHandle(static_cast<int>(handle_)),
+                       LockHolder(static_cast<int>(handle_)));
     }
     std::this_thread::sleep_for(pause);
     pause = std::min(pause * 2, kLongestPause);
@@ -155,10 +174,12 @@ void StoreFile::Unlock() {
 }
 
 bool StoreFile::Resize(uint64_t size) {
-  return IsOpen() && size <= INT64_MAX && !FaultDue() && ftruncate(static_cast<int>(handle_), static_cast<off_t>(size)) == 0;
+  return IsOpen() && size <= INT64_MAX && !FaultDue() &&
+         ftruncate(static_cast<int>(handle_), static_cast<off_t>(size)) == 0;
 }
 
-// Locks of ranges are other locks than the one on the whole file, and end with the open file as that does.
+// Locks of ranges are other locks than the one on the whole file, and end with the open file as
+// that does.
 bool StoreFile::MarkInUse() {
   struct flock range = {};
   range.l_type = F_RDLCK;
@@ -172,7 +193,8 @@ bool StoreFile::InUseByOthers() const {
   range.l_type = F_WRLCK;
   range.l_start = kUseMark;
   range.l_len = 1;
-  return IsOpen() && fcntl(static_cast<int>(handle_), F_OFD_GETLK, &range) == 0 && range.l_type != F_UNLCK;
+  return IsOpen() && fcntl(static_cast<int>(handle_), F_OFD_GETLK, &range) == 0 &&
+         range.l_type != F_UNLCK;
 }
 
 bool StoreFile::IsStill(const std::string& path) const {
@@ -183,7 +205,9 @@ bool StoreFile::IsStill(const std::string& path) const {
 
 bool StoreFile::IsStill(const std::string& path, uint64_t& size, int64_t& modified) const {
   struct stat named;
-  if (!IsOpen() || stat(path.c_str(), &named) != 0 || named.st_dev != device_ || named.st_ino != identity_) return false;
+  if (!IsOpen() || stat(path.c_str(), &named) != 0 || named.st_dev != device_ ||
+      named.st_ino != identity_)
+    return false;
   size = static_cast<uint64_t>(named.st_size);
   modified = Nanoseconds(named);
   return true;

@@ -47,7 +47,9 @@ std::string RandomName(std::string_view extension) {
 
 bool TemporaryFile::Create(std::string_view extension) {
   Delete();
-  if (extension.find('/') != std::string_view::npos || extension.find('\0') != std::string_view::npos) return false;
+  if (extension.find('/') != std::string_view::npos ||
+      extension.find('\0') != std::string_view::npos)
+    return false;
   const std::string folder = SpecialFolderPath(SpecialFolder::Temporary);
   DeleteStaleFiles(folder);
   ForgetReason();
@@ -62,7 +64,8 @@ bool TemporaryFile::Create(std::string_view extension) {
     }
   }
   if (path_.empty()) {
-    std::string path = AbsolutePath(std::string("TEMP$$$").append(extension.empty() ? ".$$$" : extension));
+    std::string path =
+        AbsolutePath(std::string("TEMP$$$").append(extension.empty() ? ".$$$" : extension));
     if (!CreateExclusively(path)) return false;
     path_ = std::move(path);
   }
@@ -88,7 +91,8 @@ bool TemporaryFile::Keep(const std::string& path, const std::string& folder) {
   }
   if (path_.empty() || linked) return linked;
   FileView view;
-  if (view.Open(path) && Write(view.Bytes()) && view.Intact() && CopyTimes(path, path_)) return true;
+  if (view.Open(path) && Write(view.Bytes()) && view.Intact() && CopyTimes(path, path_))
+    return true;
   Delete();
   return false;
 }

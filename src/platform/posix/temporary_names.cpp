@@ -18,7 +18,8 @@ struct Slot {
   char name[kLongestName] = {};
 };
 constinit Slot slots[64];  // no pages are touched before a name is entered
-static_assert(std::atomic<int>::is_always_lock_free, "the handler may only touch lock-free objects");
+static_assert(std::atomic<int>::is_always_lock_free,
+              "the handler may only touch lock-free objects");
 
 }  // namespace
 

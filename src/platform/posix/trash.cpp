@@ -4,13 +4,14 @@
 //   info/NAME.trashinfo   where it came from and when:
 //
 //       [Trash Info]
-//       Path=/home/user/a%20picture.bmp       percent-encoded; in a volume's own trash relative to the volume's top folder
-//       DeletionDate=2004-08-31T22:32:08      local time
+//       Path=/home/user/a%20picture.bmp       percent-encoded; in a volume's own trash relative to
+//       the volume's top folder DeletionDate=2004-08-31T22:32:08      local time
 //
-// Files of the home folder's device go to $XDG_DATA_HOME/Trash, others to TOP/.Trash/UID (which the administrator made, with
-// the sticky bit) or TOP/.Trash-UID of their volume. The info file is created first, exclusively; it holds the name. The size
-// cache of folders ("directorysizes") is optional and left to the desktops.
-// Source: freedesktop.org, "The FreeDesktop.org Trash specification", version 1.0.
+// Files of the home folder's device go to $XDG_DATA_HOME/Trash, others to TOP/.Trash/UID (which the
+// administrator made, with the sticky bit) or TOP/.Trash-UID of their volume. The info file is
+// created first, exclusively; it holds the name. The size cache of folders ("directorysizes") is
+// optional and left to the desktops. Source: freedesktop.org, "The FreeDesktop.org Trash
+// specification", version 1.0.
 
 #include <fcntl.h>
 #include <stdlib.h>
@@ -35,7 +36,8 @@ namespace fotomill::platform {
 namespace {
 
 constexpr int kAttempts = 10'000;     // names tried for one file
-constexpr size_t kLongestBase = 200;  // bytes kept of a long name; number, extension and ".trashinfo" follow
+// bytes kept of a long name; number, extension and ".trashinfo" follow
+constexpr size_t kLongestBase = 200;
 constexpr size_t kLongestExtension = 24;
 
 // What is to go: its folder without links and its own name.
@@ -88,7 +90,8 @@ bool FindVictim(std::string path, Victim& victim) {
   victim.name = FileNameOf(path);
   victim.folder = RealPath(folder.empty() ? "." : folder);
   struct stat facts;
-  if (victim.name.empty() || victim.name == "." || victim.name == ".." || victim.folder.empty()) return false;
+  if (victim.name.empty() || victim.name == "." || victim.name == ".." || victim.folder.empty())
+    return false;
   if (lstat(victim.Path().c_str(), &facts) != 0) return false;
   victim.device = facts.st_dev;
   return true;
@@ -130,7 +133,8 @@ bool IsOwnFolder(const std::string& path) {
 // Where the victim may go, in the order of preference.
 std::vector<Place> PlacesFor(const Victim& victim) {
   const std::string home = HomeTrash();
-  if (!home.empty() && IsOnDevice(NearestFolder(home), victim.device)) return {{home, victim.Path(), false}};
+  if (!home.empty() && IsOnDevice(NearestFolder(home), victim.device))
+    return {{home, victim.Path(), false}};
   if (!IsOnDevice(victim.folder, victim.device)) return {};  // a volume's top folder itself
   const std::string top = TopFolder(victim.folder, victim.device);
   const std::string remembered = victim.Path().substr(top.size() == 1 ? 1 : top.size() + 1);
@@ -138,7 +142,8 @@ std::vector<Place> PlacesFor(const Victim& victim) {
   std::vector<Place> places;
   struct stat facts;
   const std::string administered = JoinFolder(top, ".Trash");
-  if (lstat(administered.c_str(), &facts) == 0 && S_ISDIR(facts.st_mode) && (facts.st_mode & S_ISVTX) != 0) {
+  if (lstat(administered.c_str(), &facts) == 0 && S_ISDIR(facts.st_mode) &&
+      (facts.st_mode & S_ISVTX) != 0) {
     places.push_back({JoinFolder(administered, user), remembered, true});
   }
   places.push_back({JoinFolder(top, ".Trash-" + user), remembered, true});
@@ -164,13 +169,13 @@ std::string PercentEncoded(std::string_view path) {
 std::string InfoText(const std::string& remembered) {
   const LocalTime time = LocalTimeOf(Now());
   char date[80];
-  std::snprintf(date, sizeof date, "%04d-%02d-%02dT%02d:%02d:%02d", time.year, time.month, time.day, time.hour, time.minute,
-                time.second);
+  std::snprintf(date, sizeof date, "%04d-%02d-%02dT%02d:%02d:%02d", time.year, time.month, time.day,
+                time.hour, time.minute, time.second);
   return "[Trash Info]\nPath=" + PercentEncoded(remembered) + "\nDeletionDate=" + date + "\n";
 }
 
-// The name tried at an attempt: the file's own, then "picture.2.bmp" and so on. Very long names are shortened, their whole
-// name is in the info file.
+// The name tried at an attempt: the file's own, then "picture.2.bmp" and so on. Very long names are
+// shortened, their whole name is in the info file.
 std::string NameInTrash(const std::string& name, int attempt) {
   const PathParts parts = SplitPath(name);
   const std::string_view extension = parts.extension.substr(0, kLongestExtension);
@@ -184,7 +189,9 @@ CommitResult CreateInfo(const std::string& path, const std::string& text) {
   if (FaultDue()) return CommitResult::Failed;
   Handle handle = OpenHandle(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW, 0600);
   if (!handle.IsOpen()) return errno == EEXIST ? CommitResult::Taken : CommitResult::Failed;
-  const bool written = !FaultDue() && WriteFully(handle.Number(), reinterpret_cast<const uint8_t*>(text.data()), text.size());
+  const bool written =
+      !FaultDue() &&
+      WriteFully(handle.Number(), reinterpret_cast<const uint8_t*>(text.data()), text.size());
   if (handle.Reset() && written) return CommitResult::Done;
   unlink(path.c_str());
   return CommitResult::Failed;
@@ -192,8 +199,11 @@ CommitResult CreateInfo(const std::string& path, const std::string& text) {
 
 bool MoveTo(const Place& place, const Victim& victim) {
   MadeFolders made;
-  const std::string files = JoinFolder(place.folder, "files"), info = JoinFolder(place.folder, "info");
-  if (!(place.shared ? made.Make(place.folder) && IsOwnFolder(place.folder) : made.MakeWithParents(place.folder))) return false;
+  const std::string files = JoinFolder(place.folder, "files"),
+                    info = JoinFolder(place.folder, "info");
+  if (!(place.shared ? made.Make(place.folder) && IsOwnFolder(place.folder)
+                     : made.MakeWithParents(place.folder)))
+    return false;
   if (!made.Make(files) || !made.Make(info)) return false;
   if (place.shared && !(IsOwnFolder(files) && IsOwnFolder(info))) return false;
   const std::string text = InfoText(place.remembered);
@@ -203,7 +213,8 @@ bool MoveTo(const Place& place, const Victim& victim) {
     CommitResult result = CreateInfo(infoPath, text);
     if (result == CommitResult::Taken) continue;
     if (result == CommitResult::Failed) return false;
-    result = FaultDue() ? CommitResult::Failed : RenameRefusing(victim.Path(), JoinFolder(files, name));
+    result =
+        FaultDue() ? CommitResult::Failed : RenameRefusing(victim.Path(), JoinFolder(files, name));
     if (result == CommitResult::Done) {
       made.Keep();
       return true;
@@ -214,7 +225,8 @@ bool MoveTo(const Place& place, const Victim& victim) {
   return false;
 }
 
-// The name in a trash folder of what was deleted from the remembered path last; empty when there is nothing of it.
+// The name in a trash folder of what was deleted from the remembered path last; empty when there is
+// nothing of it.
 std::string FindInTrash(const Place& place, const std::string& ownName) {
   constexpr std::string_view kInfo = ".trashinfo";
   constexpr uint64_t kLongestInfo = 64 * 1024;
@@ -225,7 +237,8 @@ std::string FindInTrash(const Place& place, const std::string& ownName) {
   for (const FolderEntry& entry : ListFolder(info).value_or(std::vector<FolderEntry>())) {
     std::string text;
     if (!entry.name.starts_with(begin) || !entry.name.ends_with(kInfo)) continue;
-    if (ReadWholeFile(JoinFolder(info, entry.name), kLongestInfo, text) != ReadResult::Done) continue;
+    if (ReadWholeFile(JoinFolder(info, entry.name), kLongestInfo, text) != ReadResult::Done)
+      continue;
     const size_t date = text.find("\nDeletionDate=");
     if (text.find(wanted) == std::string::npos || date == std::string::npos) continue;
     const std::string name = entry.name.substr(0, entry.name.size() - kInfo.size());
@@ -255,13 +268,16 @@ bool RestoreFromTrash(const std::string& path) {
   struct stat facts;
   victim.name = FileNameOf(path);
   victim.folder = RealPath(FolderOf(path));
-  if (victim.name.empty() || victim.folder.empty() || stat(victim.folder.c_str(), &facts) != 0) return false;
+  if (victim.name.empty() || victim.folder.empty() || stat(victim.folder.c_str(), &facts) != 0)
+    return false;
   victim.device = facts.st_dev;
   for (const Place& place : PlacesFor(victim)) {
     const std::string name = FindInTrash(place, victim.name);
     if (name.empty()) continue;
     if (FaultDue()) return false;
-    if (RenameRefusing(JoinFolder(JoinFolder(place.folder, "files"), name), victim.Path()) != CommitResult::Done) return false;
+    if (RenameRefusing(JoinFolder(JoinFolder(place.folder, "files"), name), victim.Path()) !=
+        CommitResult::Done)
+      return false;
     unlink(JoinFolder(JoinFolder(place.folder, "info"), name + ".trashinfo").c_str());
     return true;
   }

@@ -46,19 +46,23 @@ bool ReadMountTable(std::string& table) {
 Volume AskSystem(const std::string& path) {
   const std::string file = NearestFile(path);
   struct statx facts;
-  if (statx(AT_FDCWD, file.c_str(), AT_STATX_SYNC_AS_STAT, STATX_BASIC_STATS | STATX_MNT_ID, &facts) != 0) return {};
+  if (statx(AT_FDCWD, file.c_str(), AT_STATX_SYNC_AS_STAT, STATX_BASIC_STATS | STATX_MNT_ID,
+            &facts) != 0)
+    return {};
   Volume volume;
   volume.available = true;
   volume.serial = FileSystemId(file);
   std::string table;
   if (!ReadMountTable(table)) return volume;
-  const std::string device = std::to_string(facts.stx_dev_major) + ":" + std::to_string(facts.stx_dev_minor);
+  const std::string device =
+      std::to_string(facts.stx_dev_major) + ":" + std::to_string(facts.stx_dev_minor);
   const bool idKnown = (facts.stx_mask & STATX_MNT_ID) != 0;
   for (const Mount& mount : ParseMountTable(table)) {
     const bool holdsFile = idKnown ? mount.id == facts.stx_mnt_id : mount.device == device;
     if (holdsFile) return DescribeMount(mount, volume.serial, "");
   }
-  volume.kind = DriveKind::Fixed;  // below a changed root the table lacks the volume that the root is on
+  // below a changed root the table lacks the volume that the root is on
+  volume.kind = DriveKind::Fixed;
   return volume;
 }
 
@@ -68,11 +72,14 @@ std::atomic<VolumeFunction> volumeFunction{AskSystem};
 
 Volume VolumeOf(const std::string& path) { return volumeFunction.load()(path); }
 
-void ReplaceVolumeFunction(VolumeFunction function) { volumeFunction = function != nullptr ? function : AskSystem; }
+void ReplaceVolumeFunction(VolumeFunction function) {
+  volumeFunction = function != nullptr ? function : AskSystem;
+}
 
 std::vector<std::string> UserVolumes() {
   std::string table;
-  return ReadMountTable(table) ? UserVolumesAmong(ParseMountTable(table)) : std::vector<std::string>();
+  return ReadMountTable(table) ? UserVolumesAmong(ParseMountTable(table))
+                               : std::vector<std::string>();
 }
 
 uint64_t FreeSpace(const std::string& path) {

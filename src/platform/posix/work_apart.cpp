@@ -27,9 +27,10 @@
 #include "platform/posix/handle.h"
 #include "platform/process.h"
 
-// A process apart is this program with the argument kServe and the number of its parent. Orders come over a socket, which is its
-// only connection: an OrderHead with the request behind it, and the handles of input and reply. It answers with Words, the last
-// of which says how the work ended. The end of the socket is its own end.
+// A process apart is this program with the argument kServe and the number of its parent. Orders
+// come over a socket, which is its only connection: an OrderHead with the request behind it, and
+// the handles of input and reply. It answers with Words, the last of which says how the work ended.
+// The end of the socket is its own end.
 
 extern char** environ;
 
@@ -66,7 +67,8 @@ bool PrepareProcess(const char* parent) {
   const rlimit none = {0, 0};
   setrlimit(RLIMIT_CORE, &none);
   setrlimit(RLIMIT_FSIZE, &none);
-  for (const int number : {SIGINT, SIGTERM}) std::signal(number, SIG_IGN);  // the program decides what becomes of its work
+  // the program decides what becomes of its work
+  for (const int number : {SIGINT, SIGTERM}) std::signal(number, SIG_IGN);
   return true;
 }
 
@@ -91,7 +93,8 @@ void LimitMemory(uint64_t bytes) {
   }
   rlimit limit = {};
   if (pages == 0 || getrlimit(RLIMIT_AS, &limit) != 0) return;
-  limit.rlim_cur = std::min<rlim_t>(pages * static_cast<rlim_t>(sysconf(_SC_PAGESIZE)) + bytes, limit.rlim_max);
+  limit.rlim_cur =
+      std::min<rlim_t>(pages * static_cast<rlim_t>(sysconf(_SC_PAGESIZE)) + bytes, limit.rlim_max);
   setrlimit(RLIMIT_AS, &limit);
 #endif
 }
@@ -128,15 +131,20 @@ void Send(int socket, Word word) {
   }
 }
 
-bool DoOrder(const OrderHead& head, std::span<const uint8_t> request, int input, int reply, std::span<const ApartTask> tasks) {
-  const auto task = std::ranges::find_if(tasks, [&](const ApartTask& row) { return std::string_view(row.name) == head.task.data(); });
-  const Mapping from(input, head.inputSize, PROT_READ), to(reply, head.replySize, PROT_READ | PROT_WRITE);
+bool DoOrder(const OrderHead& head, std::span<const uint8_t> request, int input, int reply,
+             std::span<const ApartTask> tasks) {
+  const auto task = std::ranges::find_if(
+      tasks, [&](const ApartTask& row) { return std::string_view(row.name) == head.task.data(); });
+  const Mapping from(input, head.inputSize, PROT_READ),
+      to(reply, head.replySize, PROT_READ | PROT_WRITE);
   if (task == tasks.end() || !from.Ok() || !to.Ok()) return false;
   LimitTime(head.seconds);
   LimitMemory(head.memory);
   bool done = false;
   try {
-    done = task->run({request, from.Bytes(), to.Bytes(), [](int32_t number) { Send(kSocket, {Word::Told, number}); }});
+    done = task->run({request, from.Bytes(), to.Bytes(), [](int32_t number) {
+                        Send(kSocket, {Word::Told, number});
+                      }});
   } catch (...) {  // out of memory
   }
   FreeMemoryLimit();
@@ -157,7 +165,9 @@ bool Receive(std::vector<uint8_t>& message, std::array<int, 2>& handles) {
   while ((size = recvmsg(kSocket, &header, MSG_CMSG_CLOEXEC)) < 0 && errno == EINTR) {
   }
   const cmsghdr* rights = CMSG_FIRSTHDR(&header);
-  if (size < static_cast<ssize_t>(sizeof(OrderHead)) || rights == nullptr || rights->cmsg_len != CMSG_LEN(sizeof handles)) return false;
+  if (size < static_cast<ssize_t>(sizeof(OrderHead)) || rights == nullptr ||
+      rights->cmsg_len != CMSG_LEN(sizeof handles))
+    return false;
   std::memcpy(handles.data(), CMSG_DATA(rights), sizeof handles);
   message.resize(static_cast<size_t>(size));
   return true;
@@ -241,14 +251,16 @@ bool StartProcess(Process& process) {
   posix_spawn_file_actions_init(&actions);
   posix_spawnattr_init(&attributes);
   posix_spawn_file_actions_addopen(&actions, STDIN_FILENO, "/dev/null", O_RDONLY, 0);
-  for (const int stream : {STDOUT_FILENO, STDERR_FILENO}) posix_spawn_file_actions_addopen(&actions, stream, "/dev/null", O_WRONLY, 0);
+  for (const int stream : {STDOUT_FILENO, STDERR_FILENO})
+    posix_spawn_file_actions_addopen(&actions, stream, "/dev/null", O_WRONLY, 0);
   posix_spawn_file_actions_adddup2(&actions, other.Number(), kSocket);
   posix_spawn_file_actions_addclosefrom_np(&actions, kSocket + 1);
   posix_spawnattr_setflags(&attributes, POSIX_SPAWN_SETPGROUP);  // Ctrl-C is for the program
   const std::string parent = std::to_string(getpid());
   std::string name = "fotomill", serve = kServe, number = parent;
   char* const arguments[] = {name.data(), serve.data(), number.data(), nullptr};
-  const bool started = posix_spawn(&process.id, "/proc/self/exe", &actions, &attributes, arguments, environ) == 0;
+  const bool started =
+      posix_spawn(&process.id, "/proc/self/exe", &actions, &attributes, arguments, environ) == 0;
   posix_spawn_file_actions_destroy(&actions);
   posix_spawnattr_destroy(&attributes);
   return started;
@@ -263,10 +275,12 @@ bool SendOrder(const Process& process, const ApartOrder& order, const SharedBloc
   head.inputSize = order.input.size();
   head.replySize = order.reply.Bytes().size();
   // Both are sent always; of an empty input the process makes nothing.
-  const std::array<int, 2> handles = {static_cast<int>(order.input.empty() ? order.reply.SystemHandle() : input.SystemHandle()),
-                                      static_cast<int>(order.reply.SystemHandle())};
+  const std::array<int, 2> handles = {
+      static_cast<int>(order.input.empty() ? order.reply.SystemHandle() : input.SystemHandle()),
+      static_cast<int>(order.reply.SystemHandle())};
   alignas(cmsghdr) std::array<char, CMSG_SPACE(sizeof handles)> control{};
-  iovec parts[] = {{&head, sizeof head}, {const_cast<uint8_t*>(order.request.data()), order.request.size()}};
+  iovec parts[] = {{&head, sizeof head},
+                   {const_cast<uint8_t*>(order.request.data()), order.request.size()}};
   msghdr message = {};
   message.msg_iov = parts;
   message.msg_iovlen = 2;
@@ -280,7 +294,8 @@ bool SendOrder(const Process& process, const ApartOrder& order, const SharedBloc
   return sendmsg(process.socket.Number(), &message, MSG_NOSIGNAL) >= 0;
 }
 
-ApartResult Await(const Process& process, const ApartOrder& order, const std::function<void(int32_t)>& told) {
+ApartResult Await(const Process& process, const ApartOrder& order,
+                  const std::function<void(int32_t)>& told) {
   const double until = MonotonicSeconds() + double{kClockFactor} * order.seconds;
   while (MonotonicSeconds() < until) {
     if (PendingExit() != 0 || (order.goesOn && !order.goesOn())) return ApartResult::Stopped;
@@ -309,7 +324,8 @@ bool SharedBlock::Allocate(uint64_t size) {
   // Nobody who has it may shorten it: touching what is gone would end this process.
   if (!memory.IsOpen() || ftruncate(memory.Number(), static_cast<off_t>(size)) != 0) return false;
   (void)fcntl(memory.Number(), F_ADD_SEALS, F_SEAL_SHRINK | F_SEAL_GROW | F_SEAL_SEAL);
-  void* data = mmap(nullptr, static_cast<size_t>(size), PROT_READ | PROT_WRITE, MAP_SHARED, memory.Number(), 0);
+  void* data = mmap(nullptr, static_cast<size_t>(size), PROT_READ | PROT_WRITE, MAP_SHARED,
+                    memory.Number(), 0);
   if (data == MAP_FAILED) return false;
   data_ = static_cast<uint8_t*>(data);
   size_ = size;
@@ -317,7 +333,8 @@ bool SharedBlock::Allocate(uint64_t size) {
   return true;
 }
 
-std::optional<int> ServeApart(int count, const char* const* arguments, std::span<const ApartTask> tasks) {
+std::optional<int> ServeApart(int count, const char* const* arguments,
+                              std::span<const ApartTask> tasks) {
   if (count != 3 || std::string_view(arguments[1]) != kServe) {
     servesItself = true;
     return std::nullopt;
@@ -334,7 +351,8 @@ ApartResult RunApart(const ApartOrder& order, const std::function<void(int32_t)>
   }
   Process process;
   if (!idleProcesses.Take(process) && !StartProcess(process)) return ApartResult::NotStarted;
-  const ApartResult result = SendOrder(process, order, input) ? Await(process, order, told) : ApartResult::Broken;
+  const ApartResult result =
+      SendOrder(process, order, input) ? Await(process, order, told) : ApartResult::Broken;
   if (result == ApartResult::Done || result == ApartResult::Failed) {
     idleProcesses.Keep(std::move(process));
   } else {

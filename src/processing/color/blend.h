@@ -12,7 +12,8 @@ constexpr uint16_t DivideBy255(uint16_t value) {
 
 // (background x (255 - alpha) + pixel x alpha) / 255, rounded to nearest.
 constexpr uint8_t Blend(uint8_t background, uint8_t pixel, uint8_t alpha) {
-  return static_cast<uint8_t>(DivideBy255(static_cast<uint16_t>(background * (255 - alpha) + pixel * alpha + 127)));
+  return static_cast<uint8_t>(
+      DivideBy255(static_cast<uint16_t>(background * (255 - alpha) + pixel * alpha + 127)));
 }
 
 }  // namespace fotomill

@@ -23,7 +23,8 @@ void ColorCells::AddRow(const uint8_t* bgr, int32_t width) {
   Cell* cells = cells_.Items<Cell>().data();
   for (int32_t x = 0; x < width; ++x, bgr += 3) {
     const uint32_t b = bgr[0], g = bgr[1], r = bgr[2];
-    Cell& cell = cells[(r >> kLowBits) << (2 * kCellBits) | (g >> kLowBits) << kCellBits | b >> kLowBits];
+    Cell& cell =
+        cells[(r >> kLowBits) << (2 * kCellBits) | (g >> kLowBits) << kCellBits | b >> kLowBits];
     cell.low[0] += b & kLowMask;
     cell.low[1] += g & kLowMask;
     cell.low[2] += r & kLowMask;

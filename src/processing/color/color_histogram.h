@@ -24,14 +24,16 @@ class ColorCells {
 
  private:
   struct Cell {
-    uint32_t low[3];  // sums of the bits below the cell's own: a packed image has too few pixels to overflow them
+    // sums of the bits below the cell's own: a packed image has too few pixels to overflow them
+    uint32_t low[3];
     uint32_t count;
   };
 
   platform::MemoryBlock cells_;
 };
 
-// Counts each color of a picture on its own: for pictures of at most kMostColors colors; others are left out.
+// Counts each color of a picture on its own: for pictures of at most kMostColors colors; others are
+// left out.
 class ColorCounts {
  public:
   static constexpr uint32_t kMostColors = 65536;

@@ -6,9 +6,9 @@
 
 #include "core/byte_reader.h"
 
-// Profiles of an unlikely size are left alone, and so are the tags of type 'mpet': a file of a few megabytes can ask for a
-// chain of a million steps there, which would keep a core busy for hours. All other tags take a time that the library
-// bounds, and hardly any profile has only those.
+// Profiles of an unlikely size are left alone, and so are the tags of type 'mpet': a file of a few
+// megabytes can ask for a chain of a million steps there, which would keep a core busy for hours.
+// All other tags take a time that the library bounds, and hardly any profile has only those.
 
 namespace fotomill {
 
@@ -16,7 +16,8 @@ namespace {
 
 constexpr uint64_t kLargestProfile = 8 << 20;
 constexpr uint32_t kMostTags = 100;          // as many as the library reads
-constexpr uint64_t kHeaderSize = 128;        // of a profile; the tag table follows: count, then name, offset, size of each
+// of a profile; the tag table follows: count, then name, offset, size of each
+constexpr uint64_t kHeaderSize = 128;
 constexpr uint32_t kStepsType = 0x6d706574;  // "mpet"
 constexpr uint8_t kHiddenTag = 'x';          // begins no name of a tag
 
@@ -47,7 +48,8 @@ void CloseProfile::operator()(void* profile) const { cmsCloseProfile(profile); }
 Profile OpenTrustedProfile(std::span<const uint8_t> bytes) {
   const std::vector<uint8_t> trusted = TrustedTags(bytes);
   if (trusted.empty()) return nullptr;
-  return Profile(cmsOpenProfileFromMem(trusted.data(), static_cast<cmsUInt32Number>(trusted.size())));
+  return Profile(
+      cmsOpenProfileFromMem(trusted.data(), static_cast<cmsUInt32Number>(trusted.size())));
 }
 
 }  // namespace fotomill

@@ -12,8 +12,8 @@ struct CloseProfile {
 };
 using Profile = std::unique_ptr<void, CloseProfile>;  // the library's
 
-// Opens an ICC profile that came with a picture from anywhere, without the tags that are not trusted. Null for bytes that
-// are no profile, and for one of an unlikely size.
+// Opens an ICC profile that came with a picture from anywhere, without the tags that are not
+// trusted. Null for bytes that are no profile, and for one of an unlikely size.
 Profile OpenTrustedProfile(std::span<const uint8_t> bytes);
 
 }  // namespace fotomill

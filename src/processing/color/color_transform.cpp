@@ -10,8 +10,8 @@
 #include "core/workers/share_out.h"
 #include "processing/color/color_profile.h"
 
-// The library works on whole pixels in the order of a packed image. It is told to keep no last color in a transform, so
-// that threads can share one.
+// The library works on whole pixels in the order of a packed image. It is told to keep no last
+// color in a transform, so that threads can share one.
 
 namespace fotomill {
 
@@ -24,11 +24,13 @@ constexpr int32_t kUnseen = 1;                // a difference of 8-bit values th
 Profile OpenProfile(std::span<const uint8_t> bytes) {
   Profile profile = OpenTrustedProfile(bytes);
   if (profile == nullptr) return nullptr;
-  constexpr cmsProfileClassSignature kDevices[] = {cmsSigInputClass, cmsSigDisplayClass, cmsSigOutputClass,
-                                                   cmsSigColorSpaceClass};
-  const bool device = std::ranges::find(kDevices, cmsGetDeviceClass(profile.get())) != std::end(kDevices);
+  constexpr cmsProfileClassSignature kDevices[] = {cmsSigInputClass, cmsSigDisplayClass,
+                                                   cmsSigOutputClass, cmsSigColorSpaceClass};
+  const bool device =
+      std::ranges::find(kDevices, cmsGetDeviceClass(profile.get())) != std::end(kDevices);
   const cmsColorSpaceSignature colors = cmsGetColorSpace(profile.get());
-  return device && (colors == cmsSigRgbData || colors == cmsSigGrayData) ? std::move(profile) : nullptr;
+  return device && (colors == cmsSigRgbData || colors == cmsSigGrayData) ? std::move(profile)
+                                                                         : nullptr;
 }
 
 Profile OpenSource(std::span<const uint8_t> bytes) {
@@ -57,9 +59,13 @@ bool IsGray(const PackedImage& image) {
 }
 
 // Divides rows among the cores that are free, `work` gets a first one and the one behind the last.
-void ForBandsOfRows(int32_t rows, uint64_t pixels, const std::function<void(int32_t, int32_t)>& work) {
-  const auto bands = static_cast<int32_t>(std::clamp<uint64_t>(pixels / kPixelsPerBand, 1, static_cast<uint64_t>(rows)));
-  const auto start = [&](int32_t band) { return static_cast<int32_t>(int64_t{rows} * band / bands); };
+void ForBandsOfRows(int32_t rows, uint64_t pixels,
+                    const std::function<void(int32_t, int32_t)>& work) {
+  const auto bands = static_cast<int32_t>(
+      std::clamp<uint64_t>(pixels / kPixelsPerBand, 1, static_cast<uint64_t>(rows)));
+  const auto start = [&](int32_t band) {
+    return static_cast<int32_t>(int64_t{rows} * band / bands);
+  };
   (void)ShareOut(bands, [&](int32_t band) {
     work(start(band), start(band + 1));
     return Status::Ok;
@@ -74,7 +80,8 @@ ColorTransform::ColorTransform(std::span<const uint8_t> source, std::span<const 
   gray_ = cmsGetColorSpace(from.get()) == cmsSigGrayData;
   // Grays are few: they need no short cut, which would cost dark ones their precision.
   const cmsUInt32Number flags = gray_ ? cmsFLAGS_NOCACHE | cmsFLAGS_NOOPTIMIZE : cmsFLAGS_NOCACHE;
-  transform_ = cmsCreateTransform(from.get(), gray_ ? TYPE_GRAY_8 : TYPE_BGR_8, to.get(), TYPE_BGR_8, INTENT_PERCEPTUAL, flags);
+  transform_ = cmsCreateTransform(from.get(), gray_ ? TYPE_GRAY_8 : TYPE_BGR_8, to.get(),
+                                  TYPE_BGR_8, INTENT_PERCEPTUAL, flags);
   if (transform_ == nullptr || ChangesTestColors()) return;
   cmsDeleteTransform(transform_);
   transform_ = nullptr;
@@ -88,8 +95,10 @@ void ColorTransform::Apply(PackedImage& image) const {
   if (!ChangesColors() || image.Empty()) return;
   if (image.Bits() != 24) return ApplyToColorTable(image);
   if (gray_ && !IsGray(image)) return;
-  const uint64_t pixels = static_cast<uint64_t>(image.Width()) * static_cast<uint64_t>(image.Height());
-  ForBandsOfRows(image.Height(), pixels, [&](int32_t first, int32_t end) { ApplyToRows(image, first, end); });
+  const uint64_t pixels =
+      static_cast<uint64_t>(image.Width()) * static_cast<uint64_t>(image.Height());
+  ForBandsOfRows(image.Height(), pixels,
+                 [&](int32_t first, int32_t end) { ApplyToRows(image, first, end); });
 }
 
 void ColorTransform::ApplyToColorTable(PackedImage& image) const {
@@ -118,10 +127,12 @@ void ColorTransform::ApplyToRows(PackedImage& image, int32_t first, int32_t end)
 }
 
 void ColorTransform::MapGrays(uint8_t* bgr, int32_t pixels) const {
-  for (uint8_t* const end = bgr + 3 * int64_t{pixels}; bgr < end; bgr += 3) std::copy_n(&grays_[3 * size_t{*bgr}], 3, bgr);
+  for (uint8_t* const end = bgr + 3 * int64_t{pixels}; bgr < end; bgr += 3)
+    std::copy_n(&grays_[3 * size_t{*bgr}], 3, bgr);
 }
 
-// Whether a grid of colors and the line of grays, or for gray pictures all grays, come out different.
+// Whether a grid of colors and the line of grays, or for gray pictures all grays, come out
+// different.
 bool ColorTransform::ChangesTestColors() {
   constexpr int32_t kSteps = 6, kGraySteps = 18;  // both end at 255
   std::vector<uint8_t> colors, changed;
@@ -145,7 +156,8 @@ bool ColorTransform::ChangesTestColors() {
   } else {
     cmsDoTransform(transform_, colors.data(), changed.data(), pixels);
   }
-  return !std::ranges::equal(colors, changed, [](uint8_t a, uint8_t b) { return std::abs(a - b) <= kUnseen; });
+  return !std::ranges::equal(colors, changed,
+                             [](uint8_t a, uint8_t b) { return std::abs(a - b) <= kUnseen; });
 }
 
 }  // namespace fotomill

@@ -8,21 +8,22 @@
 
 namespace fotomill {
 
-// How the colors of an ICC profile become those of a screen, by the profile's perceptual intent. Profiles of RGB and of
-// gray pictures count; none, one of another kind and one that is damaged stand for sRGB. Where the screen shows the colors as
-// they are, nothing is changed.
+// How the colors of an ICC profile become those of a screen, by the profile's perceptual intent.
+// Profiles of RGB and of gray pictures count; none, one of another kind and one that is damaged
+// stand for sRGB. Where the screen shows the colors as they are, nothing is changed.
 class ColorTransform {
  public:
-  // `source` is the profile of the pictures, `screen` that of the screen, both as files hold them. Only one of RGB
-  // counts as the latter. Takes from a part of a millisecond to some milliseconds.
+  // `source` is the profile of the pictures, `screen` that of the screen, both as files hold them.
+  // Only one of RGB counts as the latter. Takes from a part of a millisecond to some milliseconds.
   explicit ColorTransform(std::span<const uint8_t> source, std::span<const uint8_t> screen = {});
   ~ColorTransform();
   ColorTransform(const ColorTransform&) = delete;
   ColorTransform& operator=(const ColorTransform&) = delete;
 
   bool ChangesColors() const { return transform_ != nullptr; }  // false: Apply does nothing
-  // Changes the pixels of an image of 24 bits, or the color table of a smaller one; large images on all cores. A picture in
-  // colors with the profile of a gray one stays as it is. Any number of threads may call this at once.
+  // Changes the pixels of an image of 24 bits, or the color table of a smaller one; large images on
+  // all cores. A picture in colors with the profile of a gray one stays as it is. Any number of
+  // threads may call this at once.
   void Apply(PackedImage& image) const;
 
  private:

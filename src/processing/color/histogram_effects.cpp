@@ -11,7 +11,8 @@ namespace {
 
 constexpr int32_t kLeastRows = 64;  // of a band
 
-// Two sets of counters in turn: neighbors are often equal, and a counter is not ready again at once.
+// Two sets of counters in turn: neighbors are often equal, and a counter is not ready again at
+// once.
 using RowCounts = std::array<std::array<std::array<uint32_t, 256>, 3>, 2>;
 
 void CountRow(const uint8_t* bgr, int32_t width, RowCounts& counts) {
@@ -46,7 +47,9 @@ int32_t Highest(const std::array<uint64_t, 256>& counts, uint64_t cut) {
   return 0;
 }
 
-uint64_t SumOf(const std::array<uint64_t, 256>& counts) { return std::accumulate(counts.begin(), counts.end(), uint64_t{0}); }
+uint64_t SumOf(const std::array<uint64_t, 256>& counts) {
+  return std::accumulate(counts.begin(), counts.end(), uint64_t{0});
+}
 
 }  // namespace
 
@@ -88,7 +91,8 @@ PointEffect StretchEffect(const LevelCounts& counts, double clip) {
     const auto cut = static_cast<uint64_t>(static_cast<double>(SumOf(counts[c])) * clip / 100);
     const int32_t low = Lowest(counts[c], cut), high = Highest(counts[c], cut);
     const bool spread = high > low;
-    effect.tables[c] = EffectOf([=](double v) { return spread ? 255 * (v - low) / (high - low) : v; }).tables[c];
+    effect.tables[c] =
+        EffectOf([=](double v) { return spread ? 255 * (v - low) / (high - low) : v; }).tables[c];
   }
   return effect;
 }
@@ -99,7 +103,9 @@ PointEffect EqualizeEffect(const LevelCounts& counts) {
     const uint64_t all = SumOf(counts[c]) - counts[c][static_cast<size_t>(Highest(counts[c], 0))];
     uint64_t below = 0;
     for (size_t v = 0; v < 256; ++v) {
-      effect.tables[c][v] = all == 0 ? static_cast<uint8_t>(v) : RoundedLevel(255 * static_cast<double>(below) / static_cast<double>(all));
+      effect.tables[c][v] =
+          all == 0 ? static_cast<uint8_t>(v)
+                   : RoundedLevel(255 * static_cast<double>(below) / static_cast<double>(all));
       below += counts[c][v];
     }
   }

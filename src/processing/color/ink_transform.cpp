@@ -10,7 +10,8 @@ namespace {
 
 void PassThroughInks(const uint8_t* inks, size_t count, uint8_t* bgr) {
   for (size_t x = 0; x < count; ++x, inks += 4, bgr += 3) {
-    for (size_t i = 0; i < 3; ++i) bgr[i] = static_cast<uint8_t>((uint32_t{inks[2 - i]} * inks[3] + 127) / 255);
+    for (size_t i = 0; i < 3; ++i)
+      bgr[i] = static_cast<uint8_t>((uint32_t{inks[2 - i]} * inks[3] + 127) / 255);
   }
 }
 
@@ -19,12 +20,15 @@ void PassThroughInks(const uint8_t* inks, size_t count, uint8_t* bgr) {
 InkTransform::InkTransform(Kind kind, std::span<const uint8_t> profile) {
   const bool lab = kind == Kind::Lab;
   const Profile from = lab ? Profile(cmsCreateLab4Profile(nullptr)) : OpenTrustedProfile(profile);
-  if (from == nullptr || cmsGetColorSpace(from.get()) != (lab ? cmsSigLabData : cmsSigCmykData)) return;
+  if (from == nullptr || cmsGetColorSpace(from.get()) != (lab ? cmsSigLabData : cmsSigCmykData))
+    return;
   const Profile to(cmsCreate_sRGBProfile());
   if (to == nullptr) return;
-  // The library's short cut for Lab is a grid that has no point at gray, so that white would not be white.
+  // The library's short cut for Lab is a grid that has no point at gray, so that white would not be
+  // white.
   const cmsUInt32Number flags = lab ? cmsFLAGS_NOOPTIMIZE : 0;
-  transform_ = cmsCreateTransform(from.get(), lab ? TYPE_Lab_8 : TYPE_CMYK_8_REV, to.get(), TYPE_BGR_8, INTENT_PERCEPTUAL, flags);
+  transform_ = cmsCreateTransform(from.get(), lab ? TYPE_Lab_8 : TYPE_CMYK_8_REV, to.get(),
+                                  TYPE_BGR_8, INTENT_PERCEPTUAL, flags);
 }
 
 InkTransform::~InkTransform() {

@@ -9,11 +9,12 @@ namespace fotomill {
 // Pixels in printing inks or in CIE Lab as sRGB.
 class InkTransform {
  public:
-  // Cmyk: cyan, magenta, yellow, black, 255 for no ink. Lab: lightness from 0 to 255, and two values with 128 for none.
+  // Cmyk: cyan, magenta, yellow, black, 255 for no ink. Lab: lightness from 0 to 255, and two
+  // values with 128 for none.
   enum class Kind { Cmyk, Lab };
 
-  // `profile` says how inks look, by its perceptual intent. Without one, and with one that is damaged or of other colors,
-  // light passes through one ink after the other.
+  // `profile` says how inks look, by its perceptual intent. Without one, and with one that is
+  // damaged or of other colors, light passes through one ink after the other.
   InkTransform(Kind kind, std::span<const uint8_t> profile);
   ~InkTransform();
   InkTransform(const InkTransform&) = delete;

@@ -15,7 +15,8 @@ namespace fotomill {
 
 namespace {
 
-// Sums are fixed-point numbers: of a level that a sum can reach, 11 bits are whole and 20 a fraction.
+// Sums are fixed-point numbers: of a level that a sum can reach, 11 bits are whole and 20 a
+// fraction.
 constexpr int32_t kFraction = 20;
 // What rounding the three parts of a sum may have lost, so that ties still round up.
 constexpr double kTieBias = 2;
@@ -37,17 +38,22 @@ uint32_t Packed(Four sums) {
   return static_cast<uint32_t>(_mm_cvtsi128_si32(_mm_packus_epi16(packed, packed)));
 #else
   uint32_t packed = 0;
-  for (int i = 0; i < 3; ++i) packed |= static_cast<uint32_t>(std::clamp(levels[i], 0, 255)) << (8 * i);
+  for (int i = 0; i < 3; ++i)
+    packed |= static_cast<uint32_t>(std::clamp(levels[i], 0, 255)) << (8 * i);
   return packed;
 #endif
 }
 
 void ApplyMix(const MixTables& tables, uint8_t* bgr, size_t pixels) {
-  const Four *blue = tables.parts[0].data(), *green = tables.parts[1].data(), *red = tables.parts[2].data();
-  const auto mixed = [&](const uint8_t* from) { return Packed(blue[from[0]] + green[from[1]] + red[from[2]]); };
+  const Four *blue = tables.parts[0].data(), *green = tables.parts[1].data(),
+             *red = tables.parts[2].data();
+  const auto mixed = [&](const uint8_t* from) {
+    return Packed(blue[from[0]] + green[from[1]] + red[from[2]]);
+  };
   const auto store = [](uint8_t* to, uint32_t value) { std::memcpy(to, &value, sizeof value); };
   constexpr bool kLowestFirst = std::endian::native == std::endian::little;
-  for (; kLowestFirst && pixels >= 4; pixels -= 4, bgr += 12) {  // four pixels are three whole numbers
+  // four pixels are three whole numbers
+  for (; kLowestFirst && pixels >= 4; pixels -= 4, bgr += 12) {
     const uint32_t a = mixed(bgr), b = mixed(bgr + 3), c = mixed(bgr + 6), d = mixed(bgr + 9);
     store(bgr, a | b << 24);
     store(bgr + 4, b >> 8 | c << 16);
@@ -60,14 +66,17 @@ void ApplyMix(const MixTables& tables, uint8_t* bgr, size_t pixels) {
 }
 
 constexpr MixMatrix kSame = {{{1, 0, 0, 0}, {0, 1, 0, 0}, {0, 0, 1, 0}}};
-constexpr MixMatrix kGray = {{{0.299, 0.587, 0.114, 0}, {0.299, 0.587, 0.114, 0}, {0.299, 0.587, 0.114, 0}}};
-constexpr MixMatrix kSepia = {{{0.393, 0.769, 0.189, 0}, {0.349, 0.686, 0.168, 0}, {0.272, 0.534, 0.131, 0}}};
+constexpr MixMatrix kGray = {
+    {{0.299, 0.587, 0.114, 0}, {0.299, 0.587, 0.114, 0}, {0.299, 0.587, 0.114, 0}}};
+constexpr MixMatrix kSepia = {
+    {{0.393, 0.769, 0.189, 0}, {0.349, 0.686, 0.168, 0}, {0.272, 0.534, 0.131, 0}}};
 
 // from + (to - from) share.
 MixMatrix Between(const MixMatrix& from, const MixMatrix& to, double share) {
   MixMatrix matrix;
   for (size_t row = 0; row < 3; ++row) {
-    for (size_t i = 0; i < 4; ++i) matrix[row][i] = from[row][i] + (to[row][i] - from[row][i]) * share;
+    for (size_t i = 0; i < 4; ++i)
+      matrix[row][i] = from[row][i] + (to[row][i] - from[row][i]) * share;
   }
   return matrix;
 }
@@ -82,8 +91,9 @@ PointEffect EachColor(Function function) {
   return effect;
 }
 
-// A hue is a place on a circle of six sectors. In each, one channel is the largest, one the smallest, and one rises or falls
-// between them. The places of those channels, blue 0, green 1, red 2.
+// A hue is a place on a circle of six sectors. In each, one channel is the largest, one the
+// smallest, and one rises or falls between them. The places of those channels, blue 0, green 1,
+// red 2.
 struct Sector {
   uint8_t largest, between, smallest;
   bool rises;
@@ -101,11 +111,13 @@ int SectorOf(const uint8_t* bgr) {
   return 5;
 }
 
-// `turn`: sectors, 0 to 6. No division: places on the circle are counted in units of the pixel's own chroma.
+// `turn`: sectors, 0 to 6. No division: places on the circle are counted in units of the pixel's
+// own chroma.
 void TurnHue(uint8_t* bgr, double turn) {
   const int from = SectorOf(bgr);
   const Sector& old = kSectors[from];
-  const int32_t most = bgr[old.largest], least = bgr[old.smallest], between = bgr[old.between], chroma = most - least;
+  const int32_t most = bgr[old.largest], least = bgr[old.smallest], between = bgr[old.between],
+                chroma = most - least;
   if (chroma == 0) return;
   const double place = turn * chroma + (old.rises ? between - least : most - between);
   auto sectors = static_cast<int32_t>(turn);
@@ -129,7 +141,8 @@ PointEffect MixEffect(const MixMatrix& matrix) {
       for (size_t made = 0; made < 3; ++made) {
         const std::array<double, 4>& row = matrix[2 - made];
         const double rounding = old == 0 ? (row[3] + 0.5) * one + kTieBias : 0;
-        part[static_cast<int>(made)] = static_cast<int32_t>(std::lround(row[2 - old] * v * one + rounding));
+        part[static_cast<int>(made)] =
+            static_cast<int32_t>(std::lround(row[2 - old] * v * one + rounding));
       }
     }
   }
@@ -172,11 +185,13 @@ PointEffect ColorizeEffect(const BgrColor& color, const BgrColor& dark, const Bg
   for (size_t v = 0; v < 256; ++v) {
     for (size_t c = 0; c < 3; ++c) {
       const auto level = static_cast<double>(v);
-      colors[v][c] = RoundedLevel(level <= kMiddle ? dark[c] + (color[c] - dark[c]) * level / kMiddle
-                                                   : color[c] + (light[c] - color[c]) * (level - kMiddle) / kMiddle);
+      colors[v][c] = RoundedLevel(
+          level <= kMiddle ? dark[c] + (color[c] - dark[c]) * level / kMiddle
+                           : color[c] + (light[c] - color[c]) * (level - kMiddle) / kMiddle);
     }
   }
-  return EachColor([colors](uint8_t* bgr) { std::memcpy(bgr, colors[Luma(bgr[2], bgr[1], bgr[0])].data(), 3); });
+  return EachColor(
+      [colors](uint8_t* bgr) { std::memcpy(bgr, colors[Luma(bgr[2], bgr[1], bgr[0])].data(), 3); });
 }
 
 }  // namespace fotomill

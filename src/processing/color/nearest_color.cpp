@@ -16,14 +16,14 @@ int32_t Distance(const Point& a, const Point& b) {
   return sum;
 }
 
-// From `count` colors picks those that can be nearest to a point of the cell of `width` levels whose lowest corner is
-// `corner`, the one nearest to its middle first. Returns their number.
+// From `count` colors picks those that can be nearest to a point of the cell of `width` levels
+// whose lowest corner is `corner`, the one nearest to its middle first. Returns their number.
 //
-// Whether color j beats color m at a point depends on the difference of the two distances, which is linear in the
-// point: at its most favourable corner it is the middle's difference less twice the weighed half width per channel
-// times how far the two colors are apart there.
-int32_t PickCandidates(const ColorPoints& points, const uint8_t* from, int32_t count, const Point& corner, int32_t width,
-                       uint8_t* picked) {
+// Whether color j beats color m at a point depends on the difference of the two distances, which is
+// linear in the point: at its most favourable corner it is the middle's difference less twice the
+// weighed half width per channel times how far the two colors are apart there.
+int32_t PickCandidates(const ColorPoints& points, const uint8_t* from, int32_t count,
+                       const Point& corner, int32_t width, uint8_t* picked) {
   const int32_t half = (width - 1) * ColorPoints::kUnits / 2;
   Point middle;
   for (size_t c = 0; c < 3; ++c) middle[c] = corner[c] * ColorPoints::kUnits + half;
@@ -39,7 +39,8 @@ int32_t PickCandidates(const ColorPoints& points, const uint8_t* from, int32_t c
   for (int32_t i = 0; i < count; ++i) {
     const Point& point = points.channel[from[i]];
     int32_t gain = 0;
-    for (size_t c = 0; c < 3; ++c) gain += 2 * kChannelWeight[c] * half * std::abs(point[c] - nearest[c]);
+    for (size_t c = 0; c < 3; ++c)
+      gain += 2 * kChannelWeight[c] * half * std::abs(point[c] - nearest[c]);
     if (i != best && distances[i] - distances[best] <= gain) picked[found++] = from[i];
   }
   return found;
@@ -51,7 +52,8 @@ ColorPoints PointsOf(const Palette& palette, int32_t count) {
   ColorPoints points;
   points.count = count;
   for (size_t i = 0; i < static_cast<size_t>(count); ++i) {
-    for (size_t c = 0; c < 3; ++c) points.channel[i][c] = palette[3 * i + 2 - c] * ColorPoints::kUnits;
+    for (size_t c = 0; c < 3; ++c)
+      points.channel[i][c] = palette[3 * i + 2 - c] * ColorPoints::kUnits;
   }
   return points;
 }
@@ -60,16 +62,18 @@ Palette PaletteOf(const ColorPoints& points) {
   Palette palette{};
   for (size_t i = 0; i < static_cast<size_t>(points.count); ++i) {
     for (size_t c = 0; c < 3; ++c) {
-      palette[3 * i + 2 - c] = static_cast<uint8_t>((points.channel[i][c] + ColorPoints::kUnits / 2) / ColorPoints::kUnits);
+      palette[3 * i + 2 - c] = static_cast<uint8_t>(
+          (points.channel[i][c] + ColorPoints::kUnits / 2) / ColorPoints::kUnits);
     }
   }
   return palette;
 }
 
 Status NearestColor::Open(bool fine) {
-  const bool room = coarseBlock_.Allocate(coarseKnown_.size() * kCoarseList, platform::Fill::Unset) &&
-                    (!fine || (fineBlock_.Allocate(sizeof(uint32_t) << 18, platform::Fill::Unset) &&
-                               groupBlock_.Allocate(4096 * sizeof(Group), platform::Fill::Unset)));
+  const bool room =
+      coarseBlock_.Allocate(coarseKnown_.size() * kCoarseList, platform::Fill::Unset) &&
+      (!fine || (fineBlock_.Allocate(sizeof(uint32_t) << 18, platform::Fill::Unset) &&
+                 groupBlock_.Allocate(4096 * sizeof(Group), platform::Fill::Unset)));
   if (!room) return Status::MemoryAllocationError;
   if (fine) fine_ = fineBlock_.Items<uint32_t>().data();
   groups_ = groupBlock_.Items<Group>().data();
@@ -92,17 +96,22 @@ const uint8_t* NearestColor::CoarseList(uint32_t cell) {
   if (!coarseKnown_[cell]) {
     uint8_t all[256];
     for (int i = 0; i < 256; ++i) all[i] = static_cast<uint8_t>(i);
-    const Point corner = {static_cast<int32_t>(cell & 15) << 4, static_cast<int32_t>(cell >> 4 & 15) << 4,
+    const Point corner = {static_cast<int32_t>(cell & 15) << 4,
+                          static_cast<int32_t>(cell >> 4 & 15) << 4,
                           static_cast<int32_t>(cell >> 8) << 4};
-    // One level wider than the cell itself, for points between its last level and the next cell's first.
-    list[0] = static_cast<uint8_t>(PickCandidates(points_, all, points_.count, corner, 17, list + 1) - 1);
+    // One level wider than the cell itself, for points between its last level and the next cell's
+    // first.
+    list[0] =
+        static_cast<uint8_t>(PickCandidates(points_, all, points_.count, corner, 17, list + 1) - 1);
     coarseKnown_[cell] = true;
   }
   return list;
 }
 
 uint8_t NearestColor::FindPoint(const Point& point) {
-  const auto cell = [&](size_t c) { return static_cast<uint32_t>(point[c] / (16 * ColorPoints::kUnits)); };
+  const auto cell = [&](size_t c) {
+    return static_cast<uint32_t>(point[c] / (16 * ColorPoints::kUnits));
+  };
   const uint8_t* list = CoarseList(cell(2) << 8 | cell(1) << 4 | cell(0));
   int32_t best = list[1], bestDistance = Distance(points_.channel[list[1]], point);
   for (int32_t i = 2; i <= list[0] + 1; ++i) {
@@ -117,10 +126,13 @@ uint32_t NearestColor::FillFine(uint32_t cell) {
   const uint32_t blue = cell & 63, green = cell >> 6 & 63, red = cell >> 12;
   const uint8_t* coarse = CoarseList((red >> 2) << 8 | (green >> 2) << 4 | blue >> 2);
   uint8_t list[256 + 3];
-  const Point corner = {static_cast<int32_t>(blue) << 2, static_cast<int32_t>(green) << 2, static_cast<int32_t>(red) << 2};
+  const Point corner = {static_cast<int32_t>(blue) << 2, static_cast<int32_t>(green) << 2,
+                        static_cast<int32_t>(red) << 2};
   const int32_t count = PickCandidates(points_, coarse + 1, coarse[0] + 1, corner, 4, list);
   std::fill(list + count, list + 256 + 3, list[0]);
-  return fine_[cell] = list[0] | (count > 1 ? StoreGroups(list, (static_cast<uint32_t>(count) + 3) / 4) << 8 : 0);
+  return fine_[cell] =
+             list[0] |
+             (count > 1 ? StoreGroups(list, (static_cast<uint32_t>(count) + 3) / 4) << 8 : 0);
 }
 
 // Stores a list of colors in groups of four and returns its place, 0 if there is no room.

@@ -22,13 +22,13 @@ struct ColorPoints {
 ColorPoints PointsOf(const Palette& palette, int32_t count);
 Palette PaletteOf(const ColorPoints& points);  // levels are rounded
 
-// How much a squared difference of blue, green and red counts: about as the eye notices it, yet even enough that plain
-// errors stay small as well.
+// How much a squared difference of blue, green and red counts: about as the eye notices it, yet
+// even enough that plain errors stay small as well.
 inline constexpr int32_t kChannelWeight[3] = {5, 10, 7};
 
-// Answers which of up to 256 colors is nearest to a given one, exactly. The cube of colors is divided into cells
-// of 16 levels, and those into cells of 4; each keeps the few colors that can be nearest to anything in it, worked out
-// when the cell is first asked for.
+// Answers which of up to 256 colors is nearest to a given one, exactly. The cube of colors is
+// divided into cells of 16 levels, and those into cells of 4; each keeps the few colors that can be
+// nearest to anything in it, worked out when the cell is first asked for.
 class NearestColor {
  public:
   // Where only FindPoint is wanted, the fine cells are left out. MemoryAllocationError.
@@ -49,12 +49,14 @@ class NearestColor {
 
  private:
   static constexpr uint32_t kUnknown = 0xffffffff;
-  static constexpr uint32_t kMostGroups = 200'000;  // 16 MB; beyond, cells do with their middle's nearest color
+  // 16 MB; beyond, cells do with their middle's nearest color
+  static constexpr uint32_t kMostGroups = 200'000;
   static constexpr size_t kCoarseList = 257;        // a count, less one, and as many indices
 
-  // Four colors of a fine cell's list. A color's squared distance from a point, less what all colors have in common
-  // there, is linear in the point: constant - factor x channel. Four times that, with the color's place in the group
-  // added, is a whole number below 2^24, so the least one, exact in a float, names the nearest color.
+  // Four colors of a fine cell's list. A color's squared distance from a point, less what all
+  // colors have in common there, is linear in the point: constant - factor x channel. Four times
+  // that, with the color's place in the group added, is a whole number below 2^24, so the least
+  // one, exact in a float, names the nearest color.
   struct Group {
     using Four [[gnu::vector_size(16)]] = float;
     Four factor[3], constant;
@@ -69,7 +71,8 @@ class NearestColor {
     uint8_t index = 0;
     for (uint32_t left = group->groupsLeft + 1; left > 0; --left, ++group) {
       const Group::Four four = group->constant - group->factor[0] * static_cast<float>(blue) -
-                               group->factor[1] * static_cast<float>(green) - group->factor[2] * static_cast<float>(red);
+                               group->factor[1] * static_cast<float>(green) -
+                               group->factor[2] * static_cast<float>(red);
       const Group::Four crossed = __builtin_shufflevector(four, four, 2, 3, 0, 1);
       const Group::Four two = four < crossed ? four : crossed;
       const float least = two[0] < two[1] ? two[0] : two[1];

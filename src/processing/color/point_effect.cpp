@@ -65,12 +65,14 @@ void ApplyToPalette(PictureRecord& picture, std::span<const PointEffect> effects
 
 PointEffect EffectOf(const std::function<double(double)>& value) {
   PointEffect effect;
-  for (size_t v = 0; v < 256; ++v) effect.tables[0][v] = RoundedLevel(value(static_cast<double>(v)));
+  for (size_t v = 0; v < 256; ++v)
+    effect.tables[0][v] = RoundedLevel(value(static_cast<double>(v)));
   effect.tables[1] = effect.tables[2] = effect.tables[0];
   return effect;
 }
 
-Status ApplyPointEffects(PictureRecord& picture, std::span<const PointEffect> effects, const Work& work) {
+Status ApplyPointEffects(PictureRecord& picture, std::span<const PointEffect> effects,
+                         const Work& work) {
   if (picture.image.Empty()) return Status::EmptyImage;
   const std::vector<PointEffect> merged = Merged(effects);
   if (picture.image.Bits() < 24) {

@@ -12,14 +12,16 @@ void LookUp(const uint8_t* table, uint8_t* values, size_t count) {
 
 #if VECTOR_HAS_AVX2
 VECTOR_AVX2_BEGIN
-// A shuffle picks from sixteen entries, so a table is sixteen shuffles. Counted from the shuffle's first entry, values that
-// it does not serve are 16 or more; with 112 added they have the top bit, for which a shuffle gives 0.
+// A shuffle picks from sixteen entries, so a table is sixteen shuffles. Counted from the shuffle's
+// first entry, values that it does not serve are 16 or more; with 112 added they have the top bit,
+// for which a shuffle gives 0.
 void LookUpAvx2(const uint8_t* table, uint8_t* values, size_t count) {
   constexpr size_t kAtOnce = 64;
   constexpr int kParts = 16;
   __m256i parts[kParts];
   for (int i = 0; i < kParts; ++i) {
-    parts[i] = _mm256_broadcastsi128_si256(_mm_loadu_si128(reinterpret_cast<const __m128i*>(table + kParts * i)));
+    parts[i] = _mm256_broadcastsi128_si256(
+        _mm_loadu_si128(reinterpret_cast<const __m128i*>(table + kParts * i)));
   }
   const __m256i unserved = _mm256_set1_epi8(112), next = _mm256_set1_epi8(kParts);
   for (; count >= kAtOnce; count -= kAtOnce, values += kAtOnce) {
@@ -27,8 +29,10 @@ void LookUpAvx2(const uint8_t* table, uint8_t* values, size_t count) {
     __m256i first = _mm256_loadu_si256(place), second = _mm256_loadu_si256(place + 1);
     __m256i firstFound = _mm256_setzero_si256(), secondFound = _mm256_setzero_si256();
     for (int i = 0; i < kParts; ++i) {
-      firstFound = _mm256_or_si256(firstFound, _mm256_shuffle_epi8(parts[i], _mm256_adds_epu8(first, unserved)));
-      secondFound = _mm256_or_si256(secondFound, _mm256_shuffle_epi8(parts[i], _mm256_adds_epu8(second, unserved)));
+      firstFound = _mm256_or_si256(
+          firstFound, _mm256_shuffle_epi8(parts[i], _mm256_adds_epu8(first, unserved)));
+      secondFound = _mm256_or_si256(
+          secondFound, _mm256_shuffle_epi8(parts[i], _mm256_adds_epu8(second, unserved)));
       first = _mm256_sub_epi8(first, next);
       second = _mm256_sub_epi8(second, next);
     }

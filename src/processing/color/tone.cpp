@@ -10,12 +10,14 @@ namespace fotomill {
 
 namespace {
 
-// The slopes of a monotone curve at its knots. `steps` are those of the straight lines between them.
+// The slopes of a monotone curve at its knots. `steps` are those of the straight lines between
+// them.
 std::vector<double> MonotoneSlopes(std::span<const double> steps) {
   std::vector<double> slopes(steps.size() + 1);
   slopes.front() = steps.front();
   slopes.back() = steps.back();
-  for (size_t i = 1; i < steps.size(); ++i) slopes[i] = steps[i - 1] * steps[i] <= 0 ? 0 : (steps[i - 1] + steps[i]) / 2;
+  for (size_t i = 1; i < steps.size(); ++i)
+    slopes[i] = steps[i - 1] * steps[i] <= 0 ? 0 : (steps[i - 1] + steps[i]) / 2;
   for (size_t i = 0; i < steps.size(); ++i) {
     if (steps[i] == 0) {
       slopes[i] = slopes[i + 1] = 0;
@@ -37,8 +39,8 @@ double CurveAt(std::span<const CurveKnot> knots, std::span<const double> slopes,
   while (v >= knots[i + 1].x) ++i;
   // Cubic Hermite form.
   const double width = knots[i + 1].x - knots[i].x, t = (v - knots[i].x) / width, u = 1 - t;
-  return knots[i].y * (1 + 2 * t) * u * u + width * slopes[i] * t * u * u + knots[i + 1].y * t * t * (3 - 2 * t) -
-         width * slopes[i + 1] * t * t * u;
+  return knots[i].y * (1 + 2 * t) * u * u + width * slopes[i] * t * u * u +
+         knots[i + 1].y * t * t * (3 - 2 * t) - width * slopes[i + 1] * t * t * u;
 }
 
 }  // namespace
@@ -71,11 +73,13 @@ PointEffect LevelsEffect(const Levels& levels) {
 
 PointEffect CurveEffect(std::span<const CurveKnot> knots, CurveChannel channel) {
   std::vector<double> steps;
-  for (size_t i = 1; i < knots.size(); ++i) steps.push_back((knots[i].y - knots[i - 1].y) / (knots[i].x - knots[i - 1].x));
+  for (size_t i = 1; i < knots.size(); ++i)
+    steps.push_back((knots[i].y - knots[i - 1].y) / (knots[i].x - knots[i - 1].x));
   const std::vector<double> slopes = MonotoneSlopes(steps);
   PointEffect effect = EffectOf([&](double v) { return CurveAt(knots, slopes, v); });
   const PointEffect same = EffectOf([](double v) { return v; });
-  for (const auto& [c, own] : {std::pair{0u, CurveChannel::Blue}, {1u, CurveChannel::Green}, {2u, CurveChannel::Red}}) {
+  for (const auto& [c, own] :
+       {std::pair{0u, CurveChannel::Blue}, {1u, CurveChannel::Green}, {2u, CurveChannel::Red}}) {
     if (channel != CurveChannel::All && channel != own) effect.tables[c] = same.tables[c];
   }
   return effect;
@@ -99,7 +103,8 @@ PointEffect TemperatureEffect(double t) {
 PointEffect TintEffect(std::span<const uint8_t, 3> bgr, double percent) {
   PointEffect effect;
   for (size_t c = 0; c < 3; ++c) {
-    effect.tables[c] = EffectOf([=](double v) { return v + (bgr[c] - v) * percent / 100; }).tables[c];
+    effect.tables[c] =
+        EffectOf([=](double v) { return v + (bgr[c] - v) * percent / 100; }).tables[c];
   }
   return effect;
 }

@@ -10,15 +10,17 @@ namespace fotomill {
 
 // v + 2.55 b, for b from -100 to 100.
 PointEffect BrightnessEffect(double b);
-// (v - 127.5) k + 127.5 with k = tan((c + 100) pi / 400), for c from -100 (all gray) to 100 (black and white).
+// (v - 127.5) k + 127.5 with k = tan((c + 100) pi / 400), for c from -100 (all gray) to 100 (black
+// and white).
 PointEffect ContrastEffect(double c);
 // 255 (v / 255)^(1 / g), for g above 0.
 PointEffect GammaEffect(double g);
 // 255 - v.
 PointEffect InvertEffect();
 
-// What LevelsEffect maps: `black` to `outBlack`, `white` (above `black`) to `outWhite`, and between them
-// outBlack + (outWhite - outBlack) ((v - black) / (white - black))^(1 / gamma). Values beyond either end become that end's.
+// What LevelsEffect maps: `black` to `outBlack`, `white` (above `black`) to `outWhite`, and between
+// them outBlack + (outWhite - outBlack) ((v - black) / (white - black))^(1 / gamma). Values beyond
+// either end become that end's.
 struct Levels {
   double black = 0, white = 255;
   double gamma = 1;
@@ -32,9 +34,9 @@ struct CurveKnot {
 };
 // Which channels a curve changes.
 enum class CurveChannel : int32_t { All, Red, Green, Blue };
-// A smooth curve through two or more knots from left to right that never overshoots them: cubic pieces with limited slopes.
-// Level before the first knot and behind the last. Source: Fritsch and Carlson, "Monotone Piecewise Cubic
-// Interpolation", SIAM J. Numer. Anal. 17 (1980).
+// A smooth curve through two or more knots from left to right that never overshoots them: cubic
+// pieces with limited slopes. Level before the first knot and behind the last. Source: Fritsch and
+// Carlson, "Monotone Piecewise Cubic Interpolation", SIAM J. Numer. Anal. 17 (1980).
 PointEffect CurveEffect(std::span<const CurveKnot> knots, CurveChannel channel);
 
 // round(v (n - 1) / 255) 255 / (n - 1), for n of 2 or more levels.

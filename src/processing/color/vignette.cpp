@@ -24,9 +24,11 @@ Status ApplyVignette(PictureRecord& picture, const Vignette& vignette, const Wor
   RETURN_IF_BAD(PromotePicture(picture));
   const int32_t width = picture.image.Width();
   platform::MemoryBlock block;
-  if (!block.Allocate(static_cast<uint64_t>(width) * sizeof(double))) return Status::MemoryAllocationError;
+  if (!block.Allocate(static_cast<uint64_t>(width) * sizeof(double)))
+    return Status::MemoryAllocationError;
   double* const across = block.Items<double>().data();
-  for (int32_t x = 0; x < width; ++x) across[x] = SquareAcross(vignette.left + x, vignette.whole.width);
+  for (int32_t x = 0; x < width; ++x)
+    across[x] = SquareAcross(vignette.left + x, vignette.whole.width);
   const double untouched = vignette.size * vignette.size;
   return ForBands(picture.image.Height(), kLeastRows, work, [&](int32_t first, int32_t end) {
     for (int32_t y = first; y < end; ++y) {
@@ -37,7 +39,8 @@ Status ApplyVignette(PictureRecord& picture, const Vignette& vignette, const Wor
         if (square <= untouched) continue;
         const double s = std::min((std::sqrt(square) - vignette.size) / (1 - vignette.size), 1.0);
         const double share = vignette.amount * s * s * (3 - 2 * s);
-        for (size_t c = 0; c < 3; ++c) bgr[c] = RoundedLevel(bgr[c] + (vignette.color[c] - bgr[c]) * share);
+        for (size_t c = 0; c < 3; ++c)
+          bgr[c] = RoundedLevel(bgr[c] + (vignette.color[c] - bgr[c]) * share);
       }
     }
     return Status::Ok;

@@ -12,12 +12,15 @@ namespace {
 constexpr int32_t kLeastRows = 64;  // of a band: its first row costs as much as a window is high
 constexpr size_t kChannels = 4;     // blue, green, red times alpha, and alpha
 
-// Numbers divided by a constant and rounded to nearest. Exact for numbers below 2^24 and odd constants below 2^16: what
-// rounding the inverse up adds is less than 2^-16, the least distance to the next whole number.
+// Numbers divided by a constant and rounded to nearest. Exact for numbers below 2^24 and odd
+// constants below 2^16: what rounding the inverse up adds is less than 2^-16, the least distance to
+// the next whole number.
 class Divider {
  public:
   explicit Divider(uint32_t by) : half_(by / 2), inverse_(((uint64_t{1} << 40) + by - 1) / by) {}
-  uint8_t operator()(uint32_t number) const { return static_cast<uint8_t>((number + half_) * inverse_ >> 40); }
+  uint8_t operator()(uint32_t number) const {
+    return static_cast<uint8_t>((number + half_) * inverse_ >> 40);
+  }
 
  private:
   uint64_t half_, inverse_;
@@ -42,7 +45,8 @@ struct BoxBlur {
     const uint8_t* opacity = alpha->Row(Inside(y)).data();
     for (size_t i = 0; i < samples; i += kChannels, bgr += 3, ++opacity) {
       const uint32_t a = *opacity, weighed[kChannels] = {bgr[0] * a, bgr[1] * a, bgr[2] * a, a};
-      for (size_t c = 0; c < kChannels; ++c) sums[i + c] = subtract ? sums[i + c] - weighed[c] : sums[i + c] + weighed[c];
+      for (size_t c = 0; c < kChannels; ++c)
+        sums[i + c] = subtract ? sums[i + c] - weighed[c] : sums[i + c] + weighed[c];
     }
   }
 
@@ -50,7 +54,9 @@ struct BoxBlur {
   template <size_t channels, typename Put>
   void Along(std::span<const uint32_t> sums, Put put) const {
     const int32_t last = image.Width() - 1;
-    const auto column = [&](int32_t x) { return &sums[static_cast<size_t>(std::clamp(x, 0, last)) * channels]; };
+    const auto column = [&](int32_t x) {
+      return &sums[static_cast<size_t>(std::clamp(x, 0, last)) * channels];
+    };
     std::array<uint32_t, channels> window{};
     for (int32_t x = -radius; x < radius; ++x) {
       for (size_t c = 0; c < channels; ++c) window[c] += column(x)[c];
@@ -67,7 +73,8 @@ struct BoxBlur {
     platform::MemoryBlock room;
     if (!room.Allocate(samples * sizeof(uint32_t))) return Status::MemoryAllocationError;
     const std::span<uint32_t> sums = room.Items<uint32_t>();
-    const Divider divide((2 * static_cast<uint32_t>(radius) + 1) * (2 * static_cast<uint32_t>(radius) + 1));
+    const Divider divide((2 * static_cast<uint32_t>(radius) + 1) *
+                         (2 * static_cast<uint32_t>(radius) + 1));
     for (int32_t y = first - radius; y < first + radius; ++y) Gather<false>(y, sums);
     for (int32_t y = first; y < end; ++y) {
       Gather<false>(y + radius, sums);
@@ -80,7 +87,9 @@ struct BoxBlur {
         uint8_t* opacity = targetAlpha.Row(y).data();
         Along<kChannels>(sums, [&](int32_t, const std::array<uint32_t, kChannels>& window) {
           const uint64_t weight = window[3];
-          for (size_t c = 0; c < 3; ++c) *row++ = weight == 0 ? uint8_t{0} : static_cast<uint8_t>((window[c] + weight / 2) / weight);
+          for (size_t c = 0; c < 3; ++c)
+            *row++ =
+                weight == 0 ? uint8_t{0} : static_cast<uint8_t>((window[c] + weight / 2) / weight);
           *opacity++ = divide(window[3]);
         });
       }
@@ -103,8 +112,9 @@ Status BoxBlurPicture(PictureRecord& picture, int32_t radius, const Work& work) 
   const bool hasAlpha = !picture.alpha.Empty();
   const BoxBlur blur{picture.image, hasAlpha ? &picture.alpha : nullptr, radius,
                      static_cast<size_t>(width) * (hasAlpha ? kChannels : 3)};
-  RETURN_IF_BAD(ForBands(height, std::max(kLeastRows, 4 * radius), work,
-                         [&](int32_t first, int32_t end) { return blur.Band(first, end, image, alpha); }));
+  RETURN_IF_BAD(
+      ForBands(height, std::max(kLeastRows, 4 * radius), work,
+               [&](int32_t first, int32_t end) { return blur.Band(first, end, image, alpha); }));
   picture.image = std::move(image);
   picture.alpha = std::move(alpha);
   return Status::Ok;

@@ -45,7 +45,8 @@ int32_t KernelReach(size_t weights) {
   return side / 2;
 }
 
-Status ConvolvePicture(PictureRecord& picture, std::span<const double> weights, double divisor, double bias, const Work& work) {
+Status ConvolvePicture(PictureRecord& picture, std::span<const double> weights, double divisor,
+                       double bias, const Work& work) {
   const int32_t reach = KernelReach(weights.size());
   const size_t samples = 3 * static_cast<size_t>(picture.image.Width());
   return FilterRows(picture, reach, work, [&](TapRows& taps, uint8_t* out) {
@@ -69,7 +70,8 @@ Status FindPictureEdges(PictureRecord& picture, double amount, const Work& work)
     Gradient gradient(samples);
     gradient.Measure(taps);
     for (size_t i = 0; i < samples; ++i) {
-      const double square = gradient.across[i] * gradient.across[i] + gradient.down[i] * gradient.down[i];
+      const double square =
+          gradient.across[i] * gradient.across[i] + gradient.down[i] * gradient.down[i];
       out[i] = RoundedLevel(amount * std::sqrt(square));
     }
   });

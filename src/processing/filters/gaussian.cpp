@@ -20,12 +20,17 @@ constexpr double kCut = 4;          // sigmas
 constexpr double kGrid = 0.7;       // distance of the coarse grid, in sigmas
 constexpr int32_t kMostShift = 15;  // precision of weights: sums of samples stay below 2^31
 constexpr size_t kSpare = 8;        // samples that a pass may write behind a row's end
-constexpr size_t kReadAhead = 64;   // samples that a pass may read behind a row's end, with a weight of 0
+// samples that a pass may read behind a row's end, with a weight of 0
+constexpr size_t kReadAhead = 64;
 constexpr int32_t kLeastRows = 32;  // of a band
 constexpr int32_t kOpaque = 255 << kFraction;
 
-constexpr int32_t RoundUp(int32_t number, int32_t group) { return (number + group - 1) / group * group; }
-constexpr size_t RoundUp(size_t number, size_t group) { return (number + group - 1) / group * group; }
+constexpr int32_t RoundUp(int32_t number, int32_t group) {
+  return (number + group - 1) / group * group;
+}
+constexpr size_t RoundUp(size_t number, size_t group) {
+  return (number + group - 1) / group * group;
+}
 
 // The weights of a Gaussian at whole numbers around `center`, out to 4 sigma, as shares of 1.
 struct Shares {
@@ -35,7 +40,8 @@ struct Shares {
   // `step` is the distance between neighboring numbers.
   Shares(double center, double sigma, double step) {
     first = static_cast<int32_t>(std::ceil((center - kCut * sigma) / step));
-    const auto last = std::max(first, static_cast<int32_t>(std::floor((center + kCut * sigma) / step)));
+    const auto last =
+        std::max(first, static_cast<int32_t>(std::floor((center + kCut * sigma) / step)));
     double sum = 0;
     for (int32_t i = first; i <= last; ++i) {
       const double away = (i * step - center) / sigma;
@@ -45,7 +51,8 @@ struct Shares {
   }
 };
 
-// Several sets of weights, rounded to shares of 2^shift that add up exactly, each filled up with zeros.
+// Several sets of weights, rounded to shares of 2^shift that add up exactly, each filled up with
+// zeros.
 class WeightSets {
  public:
   void Make(const std::vector<Shares>& sets) {
@@ -66,7 +73,8 @@ class WeightSets {
       int16_t* weights = weights_.data() + s * static_cast<size_t>(taps_);
       for (const double share : sets[s].shares) {
         sum += share;
-        const long upToHere = &share == &sets[s].shares.back() ? 1L << shift_ : std::lround(std::ldexp(sum, shift_));
+        const long upToHere =
+            &share == &sets[s].shares.back() ? 1L << shift_ : std::lround(std::ldexp(sum, shift_));
         *weights++ = static_cast<int16_t>(upToHere - given);
         given = upToHere;
       }
@@ -87,13 +95,14 @@ class WeightSets {
   int32_t taps_ = 0, longest_ = 0, shift_ = 0;
 };
 
-// One edge of the picture: its pixels, and the cells of the coarse grid. Cell g has its center at (g + 1/2) d - 1/2, counted
-// in pixels of the whole picture.
+// One edge of the picture: its pixels, and the cells of the coarse grid. Cell g has its center at
+// (g + 1/2) d - 1/2, counted in pixels of the whole picture.
 struct Axis {
   int32_t count = 0, offset = 0;      // pixels, and the place of the first one in the whole picture
   int32_t grid = 1;                   // d; 1: pixels are blurred at once, without cells
   int32_t firstCell = 0, cells = 0;   // that the pixels need
-  WeightSets down, up;                // pixels to a cell; cells to a pixel, a set for each place within a cell
+  // pixels to a cell; cells to a pixel, a set for each place within a cell
+  WeightSets down, up;
 
   void Make(int32_t pixels, int32_t place, double sigma) {
     count = pixels;
@@ -110,14 +119,19 @@ struct Axis {
     for (int32_t p = 0; p < grid; ++p) phases.emplace_back(p - middle, half, grid);
     up.Make(phases);
     firstCell = CellsOf(0).first;
-    cells = 0;  // those behind, which have no weight, are not computed: their pixels may be far outside
-    for (int32_t x = std::max(0, count - grid); x < count; ++x) cells = std::max(cells, CellsOf(x).first + up.Longest() - firstCell);
+    // those behind, which have no weight, are not computed: their pixels may be far outside
+    cells = 0;
+    for (int32_t x = std::max(0, count - grid); x < count; ++x)
+      cells = std::max(cells, CellsOf(x).first + up.Longest() - firstCell);
     const int32_t least = firstCell;
-    for (int32_t x = 0; x < std::min(grid, count); ++x) firstCell = std::min(firstCell, CellsOf(x).first);
+    for (int32_t x = 0; x < std::min(grid, count); ++x)
+      firstCell = std::min(firstCell, CellsOf(x).first);
     cells += least - firstCell;
   }
   // The pixels of a cell, or around pixel i; counted from the first pixel.
-  FilterWindow PixelsOf(int32_t i) const { return down.Window(0, grid == 1 ? i : i * grid - offset); }
+  FilterWindow PixelsOf(int32_t i) const {
+    return down.Window(0, grid == 1 ? i : i * grid - offset);
+  }
   // The cells around pixel x.
   FilterWindow CellsOf(int32_t x) const {
     const int32_t place = x + offset;
@@ -143,11 +157,14 @@ struct GaussianPlan {
     down.Make(image->Height(), place.top, sigma);
     padding = GaussianReach(sigma) + across.grid + kTapGroup;
     if (across.grid == 1) {
-      for (int32_t x = 0; x < across.count; ++x) toCells.push_back(Moved(across.PixelsOf(x), padding));
+      for (int32_t x = 0; x < across.count; ++x)
+        toCells.push_back(Moved(across.PixelsOf(x), padding));
       return;
     }
-    for (int32_t g = 0; g < across.cells; ++g) toCells.push_back(Moved(across.PixelsOf(across.firstCell + g), padding));
-    for (int32_t x = 0; x < across.count; ++x) toPixels.push_back(Moved(across.CellsOf(x), -across.firstCell));
+    for (int32_t g = 0; g < across.cells; ++g)
+      toCells.push_back(Moved(across.PixelsOf(across.firstCell + g), padding));
+    for (int32_t x = 0; x < across.count; ++x)
+      toPixels.push_back(Moved(across.CellsOf(x), -across.firstCell));
   }
   static FilterWindow Moved(FilterWindow window, int32_t by) {
     window.first += by;
@@ -168,7 +185,8 @@ class GaussianRows {
     const bool room = padded_.Allocate((padded + kWeighedAtOnce + kReadAhead) * sizeof(int16_t)) &&
                       cells_.Allocate((cellRow + kWeighedAtOnce + kReadAhead) * sizeof(int16_t)) &&
                       ring_.Allocate(stride_ * static_cast<size_t>(held_) * sizeof(int16_t) + 1) &&
-                      rows_.Allocate(stride_ * sizeof(int16_t)) && sums_.Allocate(plan.samples * sizeof(int32_t)) &&
+                      rows_.Allocate(stride_ * sizeof(int16_t)) &&
+                      sums_.Allocate(plan.samples * sizeof(int32_t)) &&
                       pointers_.Allocate(pointers * sizeof(void*));
     return room ? Status::Ok : Status::MemoryAllocationError;
   }
@@ -197,7 +215,8 @@ class GaussianRows {
   // Weighs the source rows of a cell, or around a row, and blurs the result along the row.
   void BlurSource(int32_t cell, int16_t* row) {
     int16_t* padded = padded_.Items<int16_t>().data();
-    const size_t channels = plan_->channels, padding = static_cast<size_t>(plan_->padding) * channels;
+    const size_t channels = plan_->channels,
+                 padding = static_cast<size_t>(plan_->padding) * channels;
     WeighSource(plan_->down.PixelsOf(cell), padded + padding);
     int16_t *start = padded + padding, *end = start + plan_->samples;
     for (size_t i = 0; i < padding; i += channels) {
@@ -206,7 +225,8 @@ class GaussianRows {
     }
     const auto scale = channels == 3 ? kernels_.scaleThree : kernels_.scaleFour;
     const auto pixels = static_cast<int32_t>(plan_->toCells.size());
-    if (plan_->toPixels.empty()) return scale(padded, plan_->toCells.data(), pixels, plan_->across.down.Shift(), row);
+    if (plan_->toPixels.empty())
+      return scale(padded, plan_->toCells.data(), pixels, plan_->across.down.Shift(), row);
     int16_t* cells = cells_.Items<int16_t>().data();
     scale(padded, plan_->toCells.data(), pixels, plan_->across.down.Shift(), cells);
     scale(cells, plan_->toPixels.data(), plan_->across.count, plan_->across.up.Shift(), row);
@@ -217,7 +237,8 @@ class GaussianRows {
     const int32_t shift = plan_->down.down.Shift(), last = image.Height() - 1;
     if (plan_->alpha == nullptr && plan_->samples >= kWeighedAtOnce) {
       const uint8_t** rows = pointers_.Items<const uint8_t*>().data();
-      for (int32_t t = 0; t < window.taps; ++t) rows[t] = image.Row(std::clamp(window.first + t, 0, last)).data();
+      for (int32_t t = 0; t < window.taps; ++t)
+        rows[t] = image.Row(std::clamp(window.first + t, 0, last)).data();
       return kernels_.weighBytes(rows, window, shift - kFraction, plan_->samples, row);
     }
     int32_t* sums = sums_.Items<int32_t>().data();
@@ -235,7 +256,8 @@ class GaussianRows {
   void Convert(int32_t y, int16_t* samples) const {
     const uint8_t* bgr = plan_->image->Row(y).data();
     if (plan_->alpha == nullptr) return kernels_.widen(bgr, plan_->samples, samples);
-    kernels_.multiply(bgr, plan_->alpha->Row(y).data(), static_cast<size_t>(plan_->image->Width()), samples);
+    kernels_.multiply(bgr, plan_->alpha->Row(y).data(), static_cast<size_t>(plan_->image->Width()),
+                      samples);
   }
 
   const ResampleKernels& kernels_ = ResampleKernelsHere();
@@ -253,7 +275,8 @@ void SplitAlpha(const int16_t* samples, int32_t width, uint8_t* bgr, uint8_t* al
     alpha[x] = static_cast<uint8_t>(level);
     const float scale = level == 0 ? 0 : 255.0f / static_cast<float>(samples[3]);
     for (int c = 0; c < 3; ++c) {
-      bgr[c] = static_cast<uint8_t>(std::clamp(static_cast<float>(samples[c]) * scale + 0.5f, 0.0f, 255.0f));
+      bgr[c] = static_cast<uint8_t>(
+          std::clamp(static_cast<float>(samples[c]) * scale + 0.5f, 0.0f, 255.0f));
     }
   }
 }
@@ -262,7 +285,8 @@ void SplitAlpha(const int16_t* samples, int32_t width, uint8_t* bgr, uint8_t* al
 using FinishRow = std::function<void(int32_t y, int16_t* samples)>;
 
 // Replaces the rows of a picture by ones computed from blurred rows.
-Status FilterPicture(PictureRecord& picture, double sigma, const GaussianPlace& place, const Work& work, const FinishRow& finish) {
+Status FilterPicture(PictureRecord& picture, double sigma, const GaussianPlace& place,
+                     const Work& work, const FinishRow& finish) {
   if (picture.image.Empty()) return Status::EmptyImage;
   RETURN_IF_BAD(PromotePicture(picture));
   const int32_t width = picture.image.Width(), height = picture.image.Height();
@@ -304,12 +328,13 @@ int32_t GaussianReach(double sigma) {
   return static_cast<int32_t>(std::ceil(reach)) + 1;
 }
 
-Status BlurPicture(PictureRecord& picture, double sigma, const GaussianPlace& place, const Work& work) {
+Status BlurPicture(PictureRecord& picture, double sigma, const GaussianPlace& place,
+                   const Work& work) {
   return FilterPicture(picture, sigma, place, work, {});
 }
 
-Status UnsharpPicture(PictureRecord& picture, double sigma, double amount, double threshold, const GaussianPlace& place,
-                      const Work& work) {
+Status UnsharpPicture(PictureRecord& picture, double sigma, double amount, double threshold,
+                      const GaussianPlace& place, const Work& work) {
   constexpr int kAmountBits = 10;
   const auto factor = static_cast<int64_t>(std::lround(std::ldexp(amount, kAmountBits)));
   const auto least = static_cast<int32_t>(std::ceil(threshold * (1 << kFraction)));
@@ -326,7 +351,8 @@ Status UnsharpPicture(PictureRecord& picture, double sigma, double amount, doubl
       return static_cast<int16_t>(std::clamp<int64_t>(v + more, 0, kOpaque));
     };
     if (!hasAlpha) {
-      for (size_t i = 0; i < 3 * width; ++i) samples[i] = sharpened(bgr[i] << kFraction, samples[i]);
+      for (size_t i = 0; i < 3 * width; ++i)
+        samples[i] = sharpened(bgr[i] << kFraction, samples[i]);
       return;
     }
     std::array<int16_t, 4> own;

@@ -26,13 +26,15 @@ void AverageBlock(PictureRecord& picture, const Rectangle& block) {
     }
   }
   uint8_t mean[3] = {};
-  for (int c = 0; c < 3 && weight > 0; ++c) mean[c] = static_cast<uint8_t>((sums[c] + weight / 2) / weight);
+  for (int c = 0; c < 3 && weight > 0; ++c)
+    mean[c] = static_cast<uint8_t>((sums[c] + weight / 2) / weight);
   const uint64_t count = static_cast<uint64_t>(block.width) * static_cast<uint64_t>(block.height);
   for (int32_t y = block.y; y < block.y + block.height; ++y) {
     uint8_t* bgr = picture.image.Row(y).data() + 3 * static_cast<size_t>(block.x);
     for (int32_t x = 0; x < block.width; ++x, bgr += 3) std::copy_n(mean, 3, bgr);
     if (hasAlpha) {
-      std::fill_n(picture.alpha.Row(y).data() + block.x, block.width, static_cast<uint8_t>((weight + count / 2) / count));
+      std::fill_n(picture.alpha.Row(y).data() + block.x, block.width,
+                  static_cast<uint8_t>((weight + count / 2) / count));
     }
   }
 }
@@ -73,7 +75,8 @@ struct OilBand {
   void Column(int32_t x, int32_t y) {
     for (int32_t j = y - radius; j <= y + radius; ++j) {
       const uint32_t weight = hasAlpha ? alpha.Row(j)[x] : 1;
-      ranges.Change(colors.Row(j) + static_cast<std::ptrdiff_t>(3) * x, subtract ? 0 - weight : weight);
+      ranges.Change(colors.Row(j) + static_cast<std::ptrdiff_t>(3) * x,
+                    subtract ? 0 - weight : weight);
     }
   }
 
@@ -85,7 +88,8 @@ struct OilBand {
       const Ranges::Sum& most = ranges.Most();
       const uint8_t* own = colors.Row(y) + static_cast<std::ptrdiff_t>(3) * x;
       const auto mean = [&](uint32_t sum, uint8_t level) {
-        return most.weight == 0 ? level : static_cast<uint8_t>((sum + most.weight / 2) / most.weight);
+        return most.weight == 0 ? level
+                                : static_cast<uint8_t>((sum + most.weight / 2) / most.weight);
       };
       out[0] = mean(most.blue, own[0]);
       out[1] = mean(most.green, own[1]);
@@ -97,22 +101,29 @@ struct OilBand {
 
 }  // namespace
 
-Status MosaicPicture(PictureRecord& picture, const Rectangle& area, int32_t side, const Work& work) {
+Status MosaicPicture(PictureRecord& picture, const Rectangle& area, int32_t side,
+                     const Work& work) {
   if (picture.image.Empty()) return Status::EmptyImage;
   RETURN_IF_BAD(PromotePicture(picture));
   if (area.width <= 0 || area.height <= 0) return Status::Ok;
   const int32_t width = picture.image.Width(), height = picture.image.Height();
   const Rectangle seen = Clipped(area, width, height);
   if (seen.width == 0) return Status::Ok;
-  const int64_t firstRow = (static_cast<int64_t>(seen.y) - area.y) / side, firstColumn = (static_cast<int64_t>(seen.x) - area.x) / side;
-  const auto count = static_cast<int32_t>((static_cast<int64_t>(seen.y) + seen.height - 1 - area.y) / side - firstRow + 1);
+  const int64_t firstRow = (static_cast<int64_t>(seen.y) - area.y) / side,
+                firstColumn = (static_cast<int64_t>(seen.x) - area.x) / side;
+  const auto count = static_cast<int32_t>(
+      (static_cast<int64_t>(seen.y) + seen.height - 1 - area.y) / side - firstRow + 1);
   const int64_t right = static_cast<int64_t>(seen.x) + seen.width;
   return ForBands(count, 1, work, [&](int32_t first, int32_t end) {
     for (int32_t i = first; i < end; ++i) {
       const auto top = static_cast<int32_t>(area.y + (firstRow + i) * side);
       for (int64_t left = area.x + firstColumn * side; left < right; left += side) {
-        const Rectangle wanted = Clipped({static_cast<int32_t>(left) - seen.x, top - seen.y, side, side}, seen.width, seen.height);
-        if (wanted.width > 0) AverageBlock(picture, {wanted.x + seen.x, wanted.y + seen.y, wanted.width, wanted.height});
+        const Rectangle wanted =
+            Clipped({static_cast<int32_t>(left) - seen.x, top - seen.y, side, side}, seen.width,
+                    seen.height);
+        if (wanted.width > 0)
+          AverageBlock(picture,
+                       {wanted.x + seen.x, wanted.y + seen.y, wanted.width, wanted.height});
       }
     }
     return Status::Ok;

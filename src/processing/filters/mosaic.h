@@ -9,19 +9,21 @@
 
 namespace fotomill {
 
-// Changes within a rectangle, which may reach beyond the picture. In place: after FunctionCancelled some of it is changed.
-// Statuses: EmptyImage without a picture, MemoryAllocationError, FunctionCancelled.
+// Changes within a rectangle, which may reach beyond the picture. In place: after FunctionCancelled
+// some of it is changed. Statuses: EmptyImage without a picture, MemoryAllocationError,
+// FunctionCancelled.
 
-// Squares of `side` pixels, the first one at the top left of `area`, become the mean of their pixels. A color counts by its
-// alpha; alpha becomes its mean too.
+// Squares of `side` pixels, the first one at the top left of `area`, become the mean of their
+// pixels. A color counts by its alpha; alpha becomes its mean too.
 Status MosaicPicture(PictureRecord& picture, const Rectangle& area, int32_t side, const Work& work);
 
-// Takes the red out of pixels that have more than `ratio` times as much red as the mean of green and blue: their red becomes
-// that mean.
+// Takes the red out of pixels that have more than `ratio` times as much red as the mean of green
+// and blue: their red becomes that mean.
 Status RemoveRedEye(PictureRecord& picture, const Rectangle& area, double ratio);
 
-// Each pixel becomes the mean of those in a square of 2 radius + 1 whose luma is in the most frequent of `levels` ranges, the
-// darkest of several. Edges repeat; a pixel counts by its alpha, and alpha stays. Not in place.
+// Each pixel becomes the mean of those in a square of 2 radius + 1 whose luma is in the most
+// frequent of `levels` ranges, the darkest of several. Edges repeat; a pixel counts by its alpha,
+// and alpha stays. Not in place.
 inline constexpr int32_t kMostOilRadius = 20, kMostOilLevels = 256;
 Status OilPicture(PictureRecord& picture, int32_t radius, int32_t levels, const Work& work);
 

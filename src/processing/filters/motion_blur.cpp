@@ -74,11 +74,13 @@ struct MotionBand {
 uint8_t Rounded(uint32_t sum) { return static_cast<uint8_t>((sum + kWhole / 2) / kWhole); }
 
 void PutAlphaPixel(const uint64_t (&sums)[4], uint64_t whole, uint8_t* bgr, uint8_t& opacity) {
-  for (int c = 0; c < 3; ++c) bgr[c] = sums[3] == 0 ? uint8_t{0} : static_cast<uint8_t>((sums[c] + sums[3] / 2) / sums[3]);
+  for (int c = 0; c < 3; ++c)
+    bgr[c] = sums[3] == 0 ? uint8_t{0} : static_cast<uint8_t>((sums[c] + sums[3] / 2) / sums[3]);
   opacity = static_cast<uint8_t>((sums[3] + whole / 2) / whole);
 }
 
-// Where a point of a radial blur is, seen from the center, from where the pixel is: x' = c x - s y, y' = s x + c y.
+// Where a point of a radial blur is, seen from the center, from where the pixel is: x' = c x - s y,
+// y' = s x + c y.
 struct Turned {
   double c, s;
 };
@@ -94,8 +96,9 @@ Points PointsOf(RadialKind kind, double amount) {
       const double turn = amount * share * std::numbers::pi / 180;
       // To 2^-24, so that they are the same everywhere.
       const auto exact = [](double v) { return std::floor(v * 16777216 + 0.5) / 16777216; };
-      points[static_cast<size_t>(count)].push_back(kind == RadialKind::Spin ? Turned{exact(std::cos(turn)), exact(std::sin(turn))}
-                                                                            : Turned{1 + amount / 100 * share, 0});
+      points[static_cast<size_t>(count)].push_back(
+          kind == RadialKind::Spin ? Turned{exact(std::cos(turn)), exact(std::sin(turn))}
+                                   : Turned{1 + amount / 100 * share, 0});
     }
   }
   return points;
@@ -110,10 +113,14 @@ struct Radial {
   // Adds the four pixels around a place, in 1 / 256.
   void Add(double x, double y, uint64_t (&sums)[4]) const {
     const int32_t right = image.Width() - 1, bottom = image.Height() - 1;
-    const auto fixedX = static_cast<int64_t>(std::floor(std::clamp(x, 0.0, static_cast<double>(right)) * 256 + 0.5));
-    const auto fixedY = static_cast<int64_t>(std::floor(std::clamp(y, 0.0, static_cast<double>(bottom)) * 256 + 0.5));
-    const auto partX = static_cast<uint32_t>(fixedX & 255), partY = static_cast<uint32_t>(fixedY & 255);
-    const int32_t column = static_cast<int32_t>(fixedX >> 8), row = static_cast<int32_t>(fixedY >> 8);
+    const auto fixedX = static_cast<int64_t>(
+        std::floor(std::clamp(x, 0.0, static_cast<double>(right)) * 256 + 0.5));
+    const auto fixedY = static_cast<int64_t>(
+        std::floor(std::clamp(y, 0.0, static_cast<double>(bottom)) * 256 + 0.5));
+    const auto partX = static_cast<uint32_t>(fixedX & 255),
+               partY = static_cast<uint32_t>(fixedY & 255);
+    const int32_t column = static_cast<int32_t>(fixedX >> 8),
+                  row = static_cast<int32_t>(fixedY >> 8);
     const auto pixel = [&](int32_t i, int32_t j, uint32_t weight) {
       const auto at = static_cast<size_t>(std::min(i, right));
       const uint8_t* bgr = image.Row(std::min(j, bottom)).data() + 3 * at;
@@ -142,10 +149,12 @@ struct Radial {
     const double dy = y - centerY;
     for (int32_t x = 0; x < image.Width(); ++x, bgr += 3) {
       const double dx = x - centerX, distance = std::sqrt(dx * dx + dy * dy);
-      const auto count = static_cast<size_t>(std::clamp(std::ceil(distance * perPixel), 1.0, static_cast<double>(kMostPoints)));
+      const auto count = static_cast<size_t>(
+          std::clamp(std::ceil(distance * perPixel), 1.0, static_cast<double>(kMostPoints)));
       uint64_t sums[4] = {};
       for (const Turned& point : points[count]) {
-        const double fromX = centerX + point.c * dx - point.s * dy, fromY = centerY + point.s * dx + point.c * dy;
+        const double fromX = centerX + point.c * dx - point.s * dy,
+                     fromY = centerY + point.s * dx + point.c * dy;
         if (count <= kFewPoints) {
           Add(fromX, fromY, sums);
         } else {
@@ -198,25 +207,32 @@ Status MotionBlurPicture(PictureRecord& picture, double length, double angle, co
                      uint8_t* opacity = alpha.Row(y).data();
                      for (size_t x = 0; x < width; ++x) {
                        const uint32_t* sum = band.sums.data() + 4 * x;
-                       PutAlphaPixel({sum[0], sum[1], sum[2], sum[3]}, kWhole, bgr + 3 * x, opacity[x]);
+                       PutAlphaPixel({sum[0], sum[1], sum[2], sum[3]}, kWhole, bgr + 3 * x,
+                                     opacity[x]);
                      }
                    }
                    return Status::Ok;
                  });
 }
 
-Status RadialBlurPicture(PictureRecord& picture, RadialKind kind, double amount, double centerX, double centerY, const Work& work) {
+Status RadialBlurPicture(PictureRecord& picture, RadialKind kind, double amount, double centerX,
+                         double centerY, const Work& work) {
   if (picture.image.Empty()) return Status::EmptyImage;
   RETURN_IF_BAD(PromotePicture(picture));
   const Points points = PointsOf(kind, amount);
-  const double perPixel = std::abs(amount) * (kind == RadialKind::Spin ? std::numbers::pi / 180 : 0.01);
-  const Radial radial{picture.image, picture.alpha.Empty() ? nullptr : &picture.alpha, points, perPixel, centerX - 0.5, centerY - 0.5};
-  return Replace(picture, kLeastRows, work, [&](int32_t first, int32_t end, PackedImage& image, PackedImage& alpha) {
-    for (int32_t y = first; y < end; ++y) {
-      radial.Row(y, image.Row(y).data(), alpha.Empty() ? nullptr : alpha.Row(y).data());
-    }
-    return Status::Ok;
-  });
+  const double perPixel =
+      std::abs(amount) * (kind == RadialKind::Spin ? std::numbers::pi / 180 : 0.01);
+  const Radial radial{picture.image, picture.alpha.Empty() ? nullptr : &picture.alpha,
+                      points,        perPixel,
+                      centerX - 0.5, centerY - 0.5};
+  return Replace(picture, kLeastRows, work,
+                 [&](int32_t first, int32_t end, PackedImage& image, PackedImage& alpha) {
+                   for (int32_t y = first; y < end; ++y) {
+                     radial.Row(y, image.Row(y).data(),
+                                alpha.Empty() ? nullptr : alpha.Row(y).data());
+                   }
+                   return Status::Ok;
+                 });
 }
 
 }  // namespace fotomill

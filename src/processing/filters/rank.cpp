@@ -12,7 +12,8 @@ namespace fotomill {
 
 namespace {
 
-constexpr int32_t kMedianTile = 128;   // columns whose histograms are in the processor's cache together
+// columns whose histograms are in the processor's cache together
+constexpr int32_t kMedianTile = 128;
 constexpr int32_t kExtremeTile = 1024;
 constexpr int32_t kLeastRows = 64;     // of a band: its first row costs as much as a window is high
 
@@ -24,19 +25,23 @@ struct Tile {
 };
 
 // Histograms of the columns under a row of windows of one tile, all channels.
-// Source: S. Perreault and P. Hebert, "Median Filtering in Constant Time", IEEE Transactions on Image Processing 16 (2007).
+// Source: S. Perreault and P. Hebert, "Median Filtering in Constant Time", IEEE Transactions on
+// Image Processing 16 (2007).
 class ColumnHistograms {
  public:
-  ColumnHistograms(const PackedImage& source, int32_t radius) : source_(source), radius_(radius), channels_(Channels(source)) {}
+  ColumnHistograms(const PackedImage& source, int32_t radius)
+      : source_(source), radius_(radius), channels_(Channels(source)) {}
 
   Status Open(const Tile& tile) {
     samples_.clear();
     for (int32_t x = tile.left - radius_; x < tile.right + radius_; ++x) {
       const auto column = static_cast<size_t>(std::clamp(x, 0, source_.Width() - 1));
-      for (size_t c = 0; c < channels_; ++c) samples_.push_back(static_cast<uint32_t>(column * channels_ + c));
+      for (size_t c = 0; c < channels_; ++c)
+        samples_.push_back(static_cast<uint32_t>(column * channels_ + c));
     }
     groupStride_ = samples_.size() * kCountsInGroup;
-    if (!counts_.Allocate((kCountsInGroup + 1) * groupStride_ * sizeof(uint16_t))) return Status::MemoryAllocationError;
+    if (!counts_.Allocate((kCountsInGroup + 1) * groupStride_ * sizeof(uint16_t)))
+      return Status::MemoryAllocationError;
     for (int32_t y = tile.first - radius_; y <= tile.first + radius_; ++y) Count(Row(y), 1);
     return Status::Ok;
   }
@@ -62,7 +67,9 @@ class ColumnHistograms {
   }
 
  private:
-  const uint8_t* Row(int32_t y) const { return source_.Row(std::clamp(y, 0, source_.Height() - 1)).data(); }
+  const uint8_t* Row(int32_t y) const {
+    return source_.Row(std::clamp(y, 0, source_.Height() - 1)).data();
+  }
   uint16_t* Groups() { return counts_.Items<uint16_t>().data(); }
   uint16_t* Levels() { return Groups() + groupStride_; }
 
@@ -78,12 +85,14 @@ class ColumnHistograms {
   const PackedImage& source_;
   const int32_t radius_;
   const size_t channels_;
-  std::vector<uint32_t> samples_;  // of the tile and `radius` columns on either side: where in a row each is
+  // of the tile and `radius` columns on either side: where in a row each is
+  std::vector<uint32_t> samples_;
   size_t groupStride_ = 0;
   platform::MemoryBlock counts_;  // groups, then levels group by group
 };
 
-Status MedianTile(const PackedImage& source, int32_t radius, const Tile& tile, PackedImage& target) {
+Status MedianTile(const PackedImage& source, int32_t radius, const Tile& tile,
+                  PackedImage& target) {
   const size_t channels = Channels(source);
   const MedianRow medians = MedianRowHere();
   ColumnHistograms histograms(source, radius);
@@ -105,13 +114,15 @@ struct Greatest {
   static uint8_t Of(uint8_t a, uint8_t b) { return std::max(a, b); }
 };
 
-// Each sample becomes the extreme of itself and the `window` - 1 samples that follow it in steps of `step`. `count` samples
-// have all of them. What two windows side by side have found is combined, so that windows double.
+// Each sample becomes the extreme of itself and the `window` - 1 samples that follow it in steps of
+// `step`. `count` samples have all of them. What two windows side by side have found is combined,
+// so that windows double.
 template <typename Extreme>
 void ExtremesAhead(uint8_t* samples, size_t count, size_t window, size_t step) {
   const auto combine = [&](size_t away, size_t needed) {
     VECTOR_READS_AHEAD
-    for (size_t i = 0; i < count + needed * step; ++i) samples[i] = Extreme::Of(samples[i], samples[i + away * step]);
+    for (size_t i = 0; i < count + needed * step; ++i)
+      samples[i] = Extreme::Of(samples[i], samples[i + away * step]);
   };
   size_t have = 1;
   for (; 2 * have <= window; have *= 2) combine(have, window - 2 * have);
@@ -119,43 +130,52 @@ void ExtremesAhead(uint8_t* samples, size_t count, size_t window, size_t step) {
 }
 
 template <typename Extreme>
-Status ExtremeTile(const PackedImage& source, int32_t radius, const Tile& tile, PackedImage& target) {
+Status ExtremeTile(const PackedImage& source, int32_t radius, const Tile& tile,
+                   PackedImage& target) {
   const size_t channels = Channels(source), window = 2 * static_cast<size_t>(radius) + 1;
-  const auto columns = static_cast<size_t>(tile.right - tile.left), rows = static_cast<size_t>(tile.end - tile.first);
+  const auto columns = static_cast<size_t>(tile.right - tile.left),
+             rows = static_cast<size_t>(tile.end - tile.first);
   const size_t wide = columns * channels, stride = (columns + window - 1) * channels;
   platform::MemoryBlock room;
-  if (!room.Allocate(stride * (rows + window - 1), platform::Fill::Unset)) return Status::MemoryAllocationError;
+  if (!room.Allocate(stride * (rows + window - 1), platform::Fill::Unset))
+    return Status::MemoryAllocationError;
   for (size_t r = 0; r < rows + window - 1; ++r) {
-    const int32_t y = std::clamp(tile.first - radius + static_cast<int32_t>(r), 0, source.Height() - 1);
+    const int32_t y =
+        std::clamp(tile.first - radius + static_cast<int32_t>(r), 0, source.Height() - 1);
     const uint8_t* from = source.Row(y).data();
     uint8_t* row = room.Data() + r * stride;
     for (size_t i = 0; i < stride / channels; ++i) {
-      const int32_t x = std::clamp(tile.left - radius + static_cast<int32_t>(i), 0, source.Width() - 1);
+      const int32_t x =
+          std::clamp(tile.left - radius + static_cast<int32_t>(i), 0, source.Width() - 1);
       std::memcpy(row + i * channels, from + static_cast<size_t>(x) * channels, channels);
     }
     ExtremesAhead<Extreme>(row, wide, window, channels);
   }
   ExtremesAhead<Extreme>(room.Data(), rows * stride, window, stride);
   for (size_t r = 0; r < rows; ++r) {
-    uint8_t* row = target.Row(tile.first + static_cast<int32_t>(r)).data() + static_cast<size_t>(tile.left) * channels;
+    uint8_t* row = target.Row(tile.first + static_cast<int32_t>(r)).data() +
+                   static_cast<size_t>(tile.left) * channels;
     std::memcpy(row, room.Data() + r * stride, wide);
   }
   return Status::Ok;
 }
 
 // Ranks one image of 24 bits, or an alpha plane, into a new one.
-Status RankImage(const PackedImage& source, Rank rank, int32_t radius, const Work& work, PackedImage& target) {
+Status RankImage(const PackedImage& source, Rank rank, int32_t radius, const Work& work,
+                 PackedImage& target) {
   const auto rankTile = rank == Rank::Median    ? MedianTile
                         : rank == Rank::Minimum ? ExtremeTile<Least>
                                                 : ExtremeTile<Greatest>;
   const int32_t wide = std::max(rank == Rank::Median ? kMedianTile : kExtremeTile, 4 * radius);
-  return ForBands(source.Height(), std::max(kLeastRows, 4 * radius), work, [&](int32_t first, int32_t end) {
-    for (int32_t left = 0; left < source.Width(); left += wide) {
-      if (!work.GoesOn()) return Status::FunctionCancelled;
-      RETURN_IF_BAD(rankTile(source, radius, {left, std::min(left + wide, source.Width()), first, end}, target));
-    }
-    return Status::Ok;
-  });
+  return ForBands(
+      source.Height(), std::max(kLeastRows, 4 * radius), work, [&](int32_t first, int32_t end) {
+        for (int32_t left = 0; left < source.Width(); left += wide) {
+          if (!work.GoesOn()) return Status::FunctionCancelled;
+          RETURN_IF_BAD(rankTile(
+              source, radius, {left, std::min(left + wide, source.Width()), first, end}, target));
+        }
+        return Status::Ok;
+      });
 }
 
 // Multiplies colors by alpha, or divides them by it again.
@@ -169,7 +189,8 @@ void WeighColors(PackedImage& image, const PackedImage& alpha) {
       for (int c = 0; c < 3; ++c, ++color) {
         const uint32_t value = *color;
         if constexpr (divide) {
-          *color = a == 0 ? uint8_t{0} : static_cast<uint8_t>(std::min(255u, (value * 255 + a / 2) / a));
+          *color =
+              a == 0 ? uint8_t{0} : static_cast<uint8_t>(std::min(255u, (value * 255 + a / 2) / a));
         } else {
           *color = static_cast<uint8_t>((value * a + 127) / 255);
         }

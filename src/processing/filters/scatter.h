@@ -8,11 +8,12 @@
 
 namespace fotomill {
 
-// Effects of chance. What becomes of a pixel depends on the seed and its place alone, so neither threads nor the part of a
-// picture that is computed matter. `left`, `top`: the place of the picture in the whole. Statuses: EmptyImage,
-// MemoryAllocationError, FunctionCancelled.
+// Effects of chance. What becomes of a pixel depends on the seed and its place alone, so neither
+// threads nor the part of a picture that is computed matter. `left`, `top`: the place of the
+// picture in the whole. Statuses: EmptyImage, MemoryAllocationError, FunctionCancelled.
 
-// 64 random bits for a place. Source: G. Steele, D. Lea and C. Flood, "Fast Splittable Pseudorandom Number Generators" (2014).
+// 64 random bits for a place. Source: G. Steele, D. Lea and C. Flood, "Fast Splittable Pseudorandom
+// Number Generators" (2014).
 uint64_t RandomAt(uint64_t seed, int32_t x, int32_t y);
 
 enum class NoiseKind : int32_t {
@@ -27,10 +28,13 @@ struct NoiseOptions {
   uint32_t seed = 1;
   int32_t left = 0, top = 0;
 };
-// Changes the picture in place, row by row; alpha stays. After FunctionCancelled some rows are changed.
+// Changes the picture in place, row by row; alpha stays. After FunctionCancelled some rows are
+// changed.
 Status AddNoise(PictureRecord& picture, const NoiseOptions& options, const Work& work);
 
-// Each pixel becomes one that is at most `radius` away along both edges, alpha included; edges repeat.
-Status SpreadPicture(PictureRecord& picture, int32_t radius, uint32_t seed, int32_t left, int32_t top, const Work& work);
+// Each pixel becomes one that is at most `radius` away along both edges, alpha included; edges
+// repeat.
+Status SpreadPicture(PictureRecord& picture, int32_t radius, uint32_t seed, int32_t left,
+                     int32_t top, const Work& work);
 
 }  // namespace fotomill

@@ -12,7 +12,8 @@
 
 namespace fotomill {
 
-Status SurfaceBlurPicture(PictureRecord& picture, int32_t radius, int32_t threshold, const Work& work) {
+Status SurfaceBlurPicture(PictureRecord& picture, int32_t radius, int32_t threshold,
+                          const Work& work) {
   const size_t samples = 3 * static_cast<size_t>(picture.image.Width());
   return FilterRows(picture, radius, work, [&](TapRows& taps, uint8_t* out) {
     std::vector<int32_t> sums(samples), counts(samples);
@@ -26,11 +27,13 @@ Status SurfaceBlurPicture(PictureRecord& picture, int32_t radius, int32_t thresh
         }
       }
     }
-    for (size_t i = 0; i < samples; ++i) out[i] = static_cast<uint8_t>((sums[i] + counts[i] / 2) / counts[i]);
+    for (size_t i = 0; i < samples; ++i)
+      out[i] = static_cast<uint8_t>((sums[i] + counts[i] / 2) / counts[i]);
   });
 }
 
-Status DespecklePicture(PictureRecord& picture, int32_t radius, int32_t threshold, const Work& work) {
+Status DespecklePicture(PictureRecord& picture, int32_t radius, int32_t threshold,
+                        const Work& work) {
   if (picture.image.Empty()) return Status::EmptyImage;
   RETURN_IF_BAD(PromotePicture(picture));
   const int32_t width = picture.image.Width(), height = picture.image.Height();
@@ -45,8 +48,10 @@ Status DespecklePicture(PictureRecord& picture, int32_t radius, int32_t threshol
     uint8_t* bgr = picture.image.Row(y).data();
     const uint8_t* middle = median.image.Row(y).data();
     for (int32_t x = 0; x < width; ++x, bgr += 3, middle += 3) {
-      if (hasAlpha && median.alpha.Row(y)[static_cast<size_t>(x)] == 0) continue;  // its color is nobody's
-      const int32_t far = std::max({std::abs(bgr[0] - middle[0]), std::abs(bgr[1] - middle[1]), std::abs(bgr[2] - middle[2])});
+      // its color is nobody's
+      if (hasAlpha && median.alpha.Row(y)[static_cast<size_t>(x)] == 0) continue;
+      const int32_t far = std::max({std::abs(bgr[0] - middle[0]), std::abs(bgr[1] - middle[1]),
+                                    std::abs(bgr[2] - middle[2])});
       if (far > threshold) std::memcpy(bgr, middle, 3);
     }
   }

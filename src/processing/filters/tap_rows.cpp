@@ -27,7 +27,8 @@ const uint8_t* TapRows::At(int32_t dx, int32_t dy) {
   const uint8_t *own = colors_.Row(y_), *alpha = alpha_.Row(y_ + dy) + dx;
   for (size_t x = 0, i = 0; x < static_cast<size_t>(width_); ++x) {
     const int32_t a = alpha[x];
-    for (int c = 0; c < 3; ++c, ++i) mixed_[i] = static_cast<uint8_t>((own[i] * (255 - a) + neighbors[i] * a + 127) / 255);
+    for (int c = 0; c < 3; ++c, ++i)
+      mixed_[i] = static_cast<uint8_t>((own[i] * (255 - a) + neighbors[i] * a + 127) / 255);
   }
   return mixed_.data();
 }

@@ -14,8 +14,8 @@ namespace fotomill {
 
 namespace {
 
-// Makes an image of `size` from one of the same depth, row by row: `fill(y, row)` writes row y. Both have whole bytes per
-// pixel; images of less than 8 bits are unpacked and packed again.
+// Makes an image of `size` from one of the same depth, row by row: `fill(y, row)` writes row y.
+// Both have whole bytes per pixel; images of less than 8 bits are unpacked and packed again.
 template <typename Fill>
 Status RemakeImage(PackedImage& image, Size size, Fill fill) {
   const int32_t bits = image.Bits();
@@ -37,18 +37,21 @@ Status RemakeImage(PackedImage& image, Size size, Fill fill) {
   return Status::Ok;
 }
 
-Status PlaceImage(PackedImage& image, Size size, int32_t x, int32_t y, std::array<uint8_t, 3> pixel) {
+Status PlaceImage(PackedImage& image, Size size, int32_t x, int32_t y,
+                  std::array<uint8_t, 3> pixel) {
   const Rectangle seen = Clipped({x, y, image.Width(), image.Height()}, size.width, size.height);
   return RemakeImage(image, size, [&](const PackedImage& source, int32_t line, uint8_t* row) {
     const size_t bytes = source.Bits() == 24 ? 3 : 1;
     if (bytes == 1) {
       std::memset(row, pixel[0], static_cast<size_t>(size.width));
     } else {
-      for (int32_t i = 0; i < size.width; ++i) std::memcpy(row + 3 * static_cast<size_t>(i), pixel.data(), 3);
+      for (int32_t i = 0; i < size.width; ++i)
+        std::memcpy(row + 3 * static_cast<size_t>(i), pixel.data(), 3);
     }
     if (seen.width == 0 || line < seen.y || line >= seen.y + seen.height) return;
     std::memcpy(row + static_cast<size_t>(seen.x) * bytes,
-                source.Row(line - y).data() + static_cast<size_t>(seen.x - x) * bytes, static_cast<size_t>(seen.width) * bytes);
+                source.Row(line - y).data() + static_cast<size_t>(seen.x - x) * bytes,
+                static_cast<size_t>(seen.width) * bytes);
   });
 }
 
@@ -83,7 +86,8 @@ void TakeSize(PictureRecord& picture) {
   picture.bitsPerPixel = picture.image.Bits();
 }
 
-// The pixels of a row before `end` that are not the background, counted from the left; `end` when there are none.
+// The pixels of a row before `end` that are not the background, counted from the left; `end` when
+// there are none.
 template <typename IsOther>
 int32_t FirstOther(int32_t end, IsOther isOther) {
   for (int32_t x = 0; x < end; ++x) {
@@ -94,7 +98,8 @@ int32_t FirstOther(int32_t end, IsOther isOther) {
 
 }  // namespace
 
-Status PlaceOnCanvas(PictureRecord& picture, Size size, int32_t x, int32_t y, const Backdrop& backdrop) {
+Status PlaceOnCanvas(PictureRecord& picture, Size size, int32_t x, int32_t y,
+                     const Backdrop& backdrop) {
   if (picture.image.Empty()) return Status::EmptyImage;
   RETURN_IF_BAD(CheckPackedSize(size.width, size.height, picture.image.Bits()));
   const Rectangle own{0, 0, picture.image.Width(), picture.image.Height()};
@@ -128,11 +133,14 @@ Status PlaceOnCanvas(PictureRecord& picture, Size size, int32_t x, int32_t y, co
 Status WrapPicture(PictureRecord& picture, int64_t right, int64_t down) {
   if (picture.image.Empty()) return Status::EmptyImage;
   const Size size{picture.image.Width(), picture.image.Height()};
-  const auto within = [](int64_t way, int32_t length) { return static_cast<int32_t>((way % length + length) % length); };
+  const auto within = [](int64_t way, int32_t length) {
+    return static_cast<int32_t>((way % length + length) % length);
+  };
   const int32_t x = within(right, size.width), y = within(down, size.height);
   if (x == 0 && y == 0) return Status::Ok;
   const auto wrap = [&](const PackedImage& source, int32_t line, uint8_t* row) {
-    const size_t bytes = source.Bits() == 24 ? 3 : 1, length = static_cast<size_t>(size.width) * bytes;
+    const size_t bytes = source.Bits() == 24 ? 3 : 1,
+                 length = static_cast<size_t>(size.width) * bytes;
     const size_t way = static_cast<size_t>(x) * bytes;
     const uint8_t* from = source.Row(within(static_cast<int64_t>(line) - y, size.height)).data();
     std::memcpy(row + way, from, length - way);
@@ -166,17 +174,20 @@ Status FindContent(const PictureRecord& picture, int32_t fuzz, Rectangle& conten
         if (alpha[x] == 0 && cornerAlpha == 0) return false;
       }
       const uint8_t* pixel = bgr + 3 * static_cast<size_t>(x);
-      return std::abs(pixel[0] - corner[0]) > fuzz || std::abs(pixel[1] - corner[1]) > fuzz || std::abs(pixel[2] - corner[2]) > fuzz;
+      return std::abs(pixel[0] - corner[0]) > fuzz || std::abs(pixel[1] - corner[1]) > fuzz ||
+             std::abs(pixel[2] - corner[2]) > fuzz;
     };
     const int32_t first = FirstOther(width, isOther);
     if (first == width) continue;
     left = std::min(left, first);
     const int32_t behind = width - 1 - right;
-    right = width - 1 - std::min(behind, FirstOther(behind, [&](int32_t x) { return isOther(width - 1 - x); }));
+    right = width - 1 -
+            std::min(behind, FirstOther(behind, [&](int32_t x) { return isOther(width - 1 - x); }));
     top = std::min(top, y);
     bottom = y;
   }
-  content = bottom < 0 ? Rectangle{0, 0, width, height} : Rectangle{left, top, right - left + 1, bottom - top + 1};
+  content = bottom < 0 ? Rectangle{0, 0, width, height}
+                       : Rectangle{left, top, right - left + 1, bottom - top + 1};
   return Status::Ok;
 }
 

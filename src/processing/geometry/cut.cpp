@@ -7,8 +7,8 @@ namespace fotomill {
 
 namespace {
 
-// Copies `bits` bits from bit `from` of a row on to the start of another, the most significant bit of a byte first. The last
-// byte is filled up with zeros.
+// Copies `bits` bits from bit `from` of a row on to the start of another, the most significant bit
+// of a byte first. The last byte is filled up with zeros.
 void CopyBits(std::span<const uint8_t> row, size_t from, size_t bits, uint8_t* copy) {
   const size_t shift = from % 8;
   const size_t bytes = (bits + 7) / 8;
@@ -36,7 +36,8 @@ Status CutImage(const PackedImage& image, const Rectangle& area, PackedImage& cu
   RETURN_IF_BAD(NewPackedImage(area.width, area.height, nullptr, image.Bits(), made));
   std::ranges::copy(image.ColorTable(), made.ColorTable().begin());
   const auto bits = static_cast<size_t>(image.Bits());
-  const size_t from = static_cast<size_t>(area.x) * bits, length = static_cast<size_t>(area.width) * bits;
+  const size_t from = static_cast<size_t>(area.x) * bits,
+               length = static_cast<size_t>(area.width) * bits;
   for (int32_t y = 0; y < area.height; ++y) {
     const auto row = image.Row(area.y + y);
     if (bits >= 8) {

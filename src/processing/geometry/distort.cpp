@@ -8,7 +8,8 @@ namespace fotomill {
 
 namespace {
 
-// Sines of whole turns by interpolation in a table of exact numbers: the same on every processor, and within 1e-6.
+// Sines of whole turns by interpolation in a table of exact numbers: the same on every processor,
+// and within 1e-6.
 class Sines {
  public:
   static const Sines& Shared() {
@@ -18,7 +19,8 @@ class Sines {
   double Of(double turns) const {
     const double place = (turns - std::floor(turns)) * kEntries;
     const auto index = static_cast<size_t>(place);
-    return table_[index] + (table_[index + 1] - table_[index]) * (place - static_cast<double>(index));
+    return table_[index] +
+           (table_[index + 1] - table_[index]) * (place - static_cast<double>(index));
   }
 
  private:
@@ -32,7 +34,8 @@ class Sines {
   std::array<double, kEntries + 2> table_;
 };
 
-// Fills a row of places from how far away each pixel of the whole comes from: `way(x, y)` gives pixels to the right and down.
+// Fills a row of places from how far away each pixel of the whole comes from: `way(x, y)` gives
+// pixels to the right and down.
 template <typename Way>
 PlaceRow Moved(const WarpOrigin& origin, Way way) {
   return [=](int32_t left, int32_t y, std::span<SourcePlace> places) {
@@ -52,45 +55,56 @@ Status Distort(PictureRecord& picture, const PlaceRow& places, const Work& work)
 
 }  // namespace
 
-int32_t WaveReach(double amplitude) { return static_cast<int32_t>(std::ceil(std::abs(amplitude))) + 3; }
+int32_t WaveReach(double amplitude) {
+  return static_cast<int32_t>(std::ceil(std::abs(amplitude))) + 3;
+}
 
-Status RipplePicture(PictureRecord& picture, double amplitude, double wavelength, double centerX, double centerY,
-                     const WarpOrigin& origin, const Work& work) {
+Status RipplePicture(PictureRecord& picture, double amplitude, double wavelength, double centerX,
+                     double centerY, const WarpOrigin& origin, const Work& work) {
   const Sines& sines = Sines::Shared();
-  return Distort(picture, Moved(origin,
-                                [=, &sines](double x, double y) {
-                                  const double dx = x + 0.5 - centerX, dy = y + 0.5 - centerY, r = std::sqrt(dx * dx + dy * dy);
-                                  if (r == 0) return SourcePlace{0, 0};
-                                  const double way = -amplitude * sines.Of(r / wavelength) / r;
-                                  return PlaceAt(way * dx, way * dy);
-                                }),
+  return Distort(picture,
+                 Moved(origin,
+                       [=, &sines](double x, double y) {
+                         const double dx = x + 0.5 - centerX, dy = y + 0.5 - centerY,
+                                      r = std::sqrt(dx * dx + dy * dy);
+                         if (r == 0) return SourcePlace{0, 0};
+                         const double way = -amplitude * sines.Of(r / wavelength) / r;
+                         return PlaceAt(way * dx, way * dy);
+                       }),
                  work);
 }
 
-Status WavePicture(PictureRecord& picture, double amplitude, double wavelength, bool columns, const WarpOrigin& origin, const Work& work) {
+Status WavePicture(PictureRecord& picture, double amplitude, double wavelength, bool columns,
+                   const WarpOrigin& origin, const Work& work) {
   const Sines& sines = Sines::Shared();
-  return Distort(picture, Moved(origin,
-                                [=, &sines](double x, double y) {
-                                  const double way = -amplitude * sines.Of((columns ? x : y) / wavelength);
-                                  return columns ? PlaceAt(0, way) : PlaceAt(way, 0);
-                                }),
+  return Distort(picture,
+                 Moved(origin,
+                       [=, &sines](double x, double y) {
+                         const double way = -amplitude * sines.Of((columns ? x : y) / wavelength);
+                         return columns ? PlaceAt(0, way) : PlaceAt(way, 0);
+                       }),
                  work);
 }
 
-Status SwirlPicture(PictureRecord& picture, double degrees, double centerX, double centerY, double radius, const Work& work) {
+Status SwirlPicture(PictureRecord& picture, double degrees, double centerX, double centerY,
+                    double radius, const Work& work) {
   const Sines& sines = Sines::Shared();
-  return Distort(picture, Moved({},
-                                [=, &sines](double x, double y) {
-                                  const double dx = x + 0.5 - centerX, dy = y + 0.5 - centerY, r = std::sqrt(dx * dx + dy * dy);
-                                  if (r >= radius) return SourcePlace{0, 0};
-                                  const double share = 1 - r / radius, turns = degrees / 360 * share * share;
-                                  const double sine = sines.Of(turns), cosine = sines.Of(turns + 0.25);
-                                  return PlaceAt((cosine - 1) * dx + sine * dy, (cosine - 1) * dy - sine * dx);
-                                }),
+  return Distort(picture,
+                 Moved({},
+                       [=, &sines](double x, double y) {
+                         const double dx = x + 0.5 - centerX, dy = y + 0.5 - centerY,
+                                      r = std::sqrt(dx * dx + dy * dy);
+                         if (r >= radius) return SourcePlace{0, 0};
+                         const double share = 1 - r / radius, turns = degrees / 360 * share * share;
+                         const double sine = sines.Of(turns), cosine = sines.Of(turns + 0.25);
+                         return PlaceAt((cosine - 1) * dx + sine * dy,
+                                        (cosine - 1) * dy - sine * dx);
+                       }),
                  work);
 }
 
-Status BulgePicture(PictureRecord& picture, double amount, double centerX, double centerY, double radius, const Work& work) {
+Status BulgePicture(PictureRecord& picture, double amount, double centerX, double centerY,
+                    double radius, const Work& work) {
   return Distort(picture, Moved({},
                                 [=](double x, double y) {
                                   const double dx = x + 0.5 - centerX, dy = y + 0.5 - centerY;

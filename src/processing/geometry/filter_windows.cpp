@@ -59,17 +59,21 @@ struct Plan {
 
   double Center(int32_t i) const { return edge.begin + (i + 0.5) * scale; }
   int32_t First(int32_t i) const {
-    return std::clamp(static_cast<int32_t>(std::floor(Center(i) - shape.support * widen + 0.5)), 0, edge.count - 1);
+    return std::clamp(static_cast<int32_t>(std::floor(Center(i) - shape.support * widen + 0.5)), 0,
+                      edge.count - 1);
   }
   int32_t End(int32_t i) const {
-    return std::clamp(static_cast<int32_t>(std::floor(Center(i) + shape.support * widen + 0.5)), First(i) + 1, edge.count);
+    return std::clamp(static_cast<int32_t>(std::floor(Center(i) + shape.support * widen + 0.5)),
+                      First(i) + 1, edge.count);
   }
   // The shares of the source pixels of window i, which add up to 1.
   void Shares(int32_t i, double* shares) const {
     const int32_t first = First(i), taps = End(i) - first;
     double sum = 0;
-    // Where a pixel lies exactly on a box's border, the order of these sums decides: it is that of the peers.
-    for (int32_t t = 0; t < taps; ++t) sum += shares[t] = shape.value((t + first - Center(i) + 0.5) * (1 / widen));
+    // Where a pixel lies exactly on a box's border, the order of these sums decides: it is that of
+    // the peers.
+    for (int32_t t = 0; t < taps; ++t)
+      sum += shares[t] = shape.value((t + first - Center(i) + 0.5) * (1 / widen));
     for (int32_t t = 0; t < taps; ++t) shares[t] = sum != 0 ? shares[t] / sum : 1.0 / taps;
   }
 };
@@ -89,14 +93,17 @@ void RoundShares(const double* shares, int32_t taps, int32_t shift, int16_t* wei
 
 }  // namespace
 
-Status FilterWindows::Make(const SourceEdge& edge, int32_t count, ScaleFilter filter, int32_t mostShift) {
+Status FilterWindows::Make(const SourceEdge& edge, int32_t count, ScaleFilter filter,
+                           int32_t mostShift) {
   const double scale = edge.extent / count;
   const Plan plan{ShapeOf(filter), edge, scale, std::max(1.0, scale)};
-  const auto most = std::min(static_cast<int32_t>(std::ceil(plan.shape.support * plan.widen)) * 2 + 1, edge.count);
+  const auto most = std::min(
+      static_cast<int32_t>(std::ceil(plan.shape.support * plan.widen)) * 2 + 1, edge.count);
   mostTaps_ = (most + kTapGroup - 1) / kTapGroup * kTapGroup;
   const uint64_t numbers = static_cast<uint64_t>(count) * static_cast<uint64_t>(mostTaps_);
   platform::MemoryBlock shareBlock;
-  if (!shareBlock.Allocate(numbers * sizeof(double)) || !weights_.Allocate(numbers * sizeof(int16_t)) ||
+  if (!shareBlock.Allocate(numbers * sizeof(double)) ||
+      !weights_.Allocate(numbers * sizeof(int16_t)) ||
       !windows_.Allocate(static_cast<uint64_t>(count) * sizeof(FilterWindow))) {
     return Status::MemoryAllocationError;
   }
@@ -110,8 +117,8 @@ Status FilterWindows::Make(const SourceEdge& edge, int32_t count, ScaleFilter fi
   shift_ = mostShift;
   while (shift_ > 1 && std::ldexp(largest, shift_) > INT16_MAX - 1) --shift_;
 
-  // Equal halves of an edge get windows that mirror each other to the last bit. The box has no mirror: of two pixels at
-  // its borders it takes the left one.
+  // Equal halves of an edge get windows that mirror each other to the last bit. The box has no
+  // mirror: of two pixels at its borders it takes the left one.
   const bool mirrored = filter != ScaleFilter::Box && 2 * edge.begin + edge.extent == edge.count;
   for (int32_t i = 0; i < count; ++i) {
     const size_t place = static_cast<size_t>(i) * static_cast<size_t>(mostTaps_);
@@ -121,7 +128,8 @@ Status FilterWindows::Make(const SourceEdge& edge, int32_t count, ScaleFilter fi
     const bool isMirror = mirrored && twin < i;
     const int32_t source = isMirror ? twin : i;
     const int32_t taps = plan.End(source) - plan.First(source);
-    RoundShares(shares + static_cast<size_t>(source) * static_cast<size_t>(mostTaps_), taps, shift_, weights);
+    RoundShares(shares + static_cast<size_t>(source) * static_cast<size_t>(mostTaps_), taps, shift_,
+                weights);
     if (isMirror) std::reverse(weights, weights + taps);
     window.first = isMirror ? edge.count - plan.End(source) : plan.First(source);
     window.taps = (taps + kTapGroup - 1) / kTapGroup * kTapGroup;

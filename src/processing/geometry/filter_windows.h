@@ -10,17 +10,20 @@
 
 namespace fotomill {
 
-// An edge of the source: it has `count` pixels, and reaches from `begin` over a length of `extent`, counted in pixels
-// from the first one's outer border. The first and the last pixel may reach beyond it.
+// An edge of the source: it has `count` pixels, and reaches from `begin` over a length of `extent`,
+// counted in pixels from the first one's outer border. The first and the last pixel may reach
+// beyond it.
 struct SourceEdge {
   int32_t count;
   double begin, extent;
 };
 
-// The windows of all output pixels along one edge: which source pixels each is made of, and their weights.
+// The windows of all output pixels along one edge: which source pixels each is made of, and their
+// weights.
 class FilterWindows {
  public:
-  // Windows for `count` output pixels. `mostShift` bounds the weights' precision. MemoryAllocationError.
+  // Windows for `count` output pixels. `mostShift` bounds the weights' precision.
+  // MemoryAllocationError.
   Status Make(const SourceEdge& edge, int32_t count, ScaleFilter filter, int32_t mostShift);
 
   // In the order of the output pixels; they hold until the next Make.

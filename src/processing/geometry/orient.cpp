@@ -10,14 +10,15 @@ namespace fotomill {
 
 namespace {
 
-// Pixels of a tile's side: source and destination of a tile stay in the second cache while rows become columns. Smaller ones,
-// for the first cache, take half as long again.
+// Pixels of a tile's side: source and destination of a tile stay in the second cache while rows
+// become columns. Smaller ones, for the first cache, take half as long again.
 constexpr int32_t kTile = 128;
 
 // Source and destination as grids of pixels of `bytes` each, addressed from the top.
 template <int bytes>
 void TurnTile(const PackedImage& from, PackedImage& to, Turn turn, int32_t left, int32_t top) {
-  const int32_t right = std::min(left + kTile, to.Width()), bottom = std::min(top + kTile, to.Height());
+  const int32_t right = std::min(left + kTile, to.Width()),
+                bottom = std::min(top + kTile, to.Height());
   for (int32_t y = top; y < bottom; ++y) {
     uint8_t* pixel = to.Row(y).data() + static_cast<size_t>(left) * bytes;
     const int32_t column = turn.flipX ? from.Width() - 1 - y : y;
@@ -37,7 +38,8 @@ template <int bytes>
 void TurnRows(const PackedImage& from, PackedImage& to, Turn turn) {
   if (turn.swap) {
     for (int32_t top = 0; top < to.Height(); top += kTile) {
-      for (int32_t left = 0; left < to.Width(); left += kTile) TurnTile<bytes>(from, to, turn, left, top);
+      for (int32_t left = 0; left < to.Width(); left += kTile)
+        TurnTile<bytes>(from, to, turn, left, top);
     }
     return;
   }
@@ -49,7 +51,8 @@ void TurnRows(const PackedImage& from, PackedImage& to, Turn turn) {
       continue;
     }
     source += static_cast<size_t>(from.Width()) * bytes;
-    for (int32_t x = 0; x < to.Width(); ++x, pixel += bytes) std::memcpy(pixel, source -= bytes, bytes);
+    for (int32_t x = 0; x < to.Width(); ++x, pixel += bytes)
+      std::memcpy(pixel, source -= bytes, bytes);
   }
 }
 

@@ -13,12 +13,13 @@ namespace fotomill {
 
 namespace {
 
-constexpr double kLeftToFilter = 4;      // a reduction by twice as much or more is begun by averaging blocks of pixels
+// a reduction by twice as much or more is begun by averaging blocks of pixels
+constexpr double kLeftToFilter = 4;
 constexpr int32_t kMostByteShift = 20;   // precision of the weights for whole gray levels
 constexpr int32_t kMostShortShift = 15;  // and for samples: sums stay below 2^31
 
-// How the pixels along an edge are averaged: in blocks of `block`, of which the first begins `overhang` pixels before
-// the edge, so that what does not divide evenly is cut from both ends.
+// How the pixels along an edge are averaged: in blocks of `block`, of which the first begins
+// `overhang` pixels before the edge, so that what does not divide evenly is cut from both ends.
 struct Blocks {
   int32_t block = 1, count = 0, overhang = 0;
 
@@ -30,9 +31,13 @@ struct Blocks {
     overhang = static_cast<int32_t>((static_cast<int64_t>(count) * block - sourceCount) / 2);
   }
   int32_t First(int32_t i) const { return std::max(i * block - overhang, 0); }
-  int32_t End(int32_t i, int32_t sourceCount) const { return std::min(i * block - overhang + block, sourceCount); }
+  int32_t End(int32_t i, int32_t sourceCount) const {
+    return std::min(i * block - overhang + block, sourceCount);
+  }
   // The edge in blocks, for the filter; `reach` pixels belong to the picture.
-  SourceEdge Edge(double reach) const { return {count, static_cast<double>(overhang) / block, reach / block}; }
+  SourceEdge Edge(double reach) const {
+    return {count, static_cast<double>(overhang) / block, reach / block};
+  }
 };
 
 bool IsOpaque(const PackedImage& alpha) {
@@ -56,23 +61,27 @@ struct LightCurve {
     }
     for (size_t l = 0; l < level.size(); ++l) {
       const double linear = static_cast<double>(l) / kMost;
-      const double c = linear <= 0.0031308 ? linear * 12.92 : 1.055 * std::pow(linear, 1 / 2.4) - 0.055;
+      const double c =
+          linear <= 0.0031308 ? linear * 12.92 : 1.055 * std::pow(linear, 1 / 2.4) - 0.055;
       level[l] = static_cast<uint8_t>(std::lround(c * 255));
     }
   }
-  uint8_t LevelOf(float amount) const { return level[static_cast<size_t>(std::clamp(amount + 0.5f, 0.0f, float{kMost}))]; }
+  uint8_t LevelOf(float amount) const {
+    return level[static_cast<size_t>(std::clamp(amount + 0.5f, 0.0f, float{kMost}))];
+  }
 };
 const LightCurve& Light() {
   static const LightCurve curve;
   return curve;
 }
 
-// Delivers the rows of a picture as samples, averaged in blocks where it shrinks much. Rows are asked for in order.
+// Delivers the rows of a picture as samples, averaged in blocks where it shrinks much. Rows are
+// asked for in order.
 class SampleSource {
  public:
   // `alpha` and `light` may be null.
-  Status Open(const PackedImage& image, const PackedImage* alpha, const LightCurve* light, const Blocks& across,
-              const Blocks& down) {
+  Status Open(const PackedImage& image, const PackedImage* alpha, const LightCurve* light,
+              const Blocks& across, const Blocks& down) {
     image_ = &image;
     alpha_ = alpha;
     light_ = light;
@@ -109,7 +118,8 @@ class SampleSource {
     if (light_ != nullptr) {
       ConvertToLight(y, samples);
     } else if (alpha_ != nullptr) {
-      kernels_.multiply(rows_.Row(y), alpha_->Row(y).data(), static_cast<size_t>(image_->Width()), samples);
+      kernels_.multiply(rows_.Row(y), alpha_->Row(y).data(), static_cast<size_t>(image_->Width()),
+                        samples);
     } else {
       kernels_.widen(rows_.Row(y), samples_, samples);
     }
@@ -123,13 +133,15 @@ class SampleSource {
     }
     const uint8_t* alpha = alpha_->Row(y).data();
     for (int32_t x = 0; x < image_->Width(); ++x, bgr += 3, samples += 4) {
-      for (int c = 0; c < 3; ++c) samples[c] = static_cast<int16_t>((light_->light[bgr[c]] * alpha[x] + 127) / 255);
+      for (int c = 0; c < 3; ++c)
+        samples[c] = static_cast<int16_t>((light_->light[bgr[c]] * alpha[x] + 127) / 255);
       samples[3] = static_cast<int16_t>(alpha[x] << kFraction);
     }
   }
 
   template <int channels>
-  static void AverageBlocks(const int32_t* sums, int32_t width, const Blocks& across, int32_t rows, int16_t* averages) {
+  static void AverageBlocks(const int32_t* sums, int32_t width, const Blocks& across, int32_t rows,
+                            int16_t* averages) {
     for (int32_t i = 0; i < across.count; ++i, averages += channels) {
       const int32_t here = across.End(i, width) - across.First(i);
       int64_t total[channels] = {};
@@ -137,7 +149,8 @@ class SampleSource {
         for (int c = 0; c < channels; ++c) total[c] += sums[c];
       }
       const double share = 1.0 / (static_cast<double>(here) * rows);
-      for (int c = 0; c < channels; ++c) averages[c] = static_cast<int16_t>(static_cast<double>(total[c]) * share + 0.5);
+      for (int c = 0; c < channels; ++c)
+        averages[c] = static_cast<int16_t>(static_cast<double>(total[c]) * share + 0.5);
     }
   }
 
@@ -153,7 +166,8 @@ class SampleSource {
 };
 
 // Divides the colors by their alpha again. A pixel that nothing is seen of is black.
-void SplitAlpha(const int16_t* pixels, int32_t width, const LightCurve* light, uint8_t* bgr, uint8_t* alpha) {
+void SplitAlpha(const int16_t* pixels, int32_t width, const LightCurve* light, uint8_t* bgr,
+                uint8_t* alpha) {
   for (int32_t x = 0; x < width; ++x, pixels += 4, bgr += 3) {
     const int32_t level = std::clamp((pixels[3] + (1 << (kFraction - 1))) >> kFraction, 0, 255);
     alpha[x] = static_cast<uint8_t>(level);
@@ -167,7 +181,9 @@ void SplitAlpha(const int16_t* pixels, int32_t width, const LightCurve* light, u
 }
 
 void SplitLight(const int16_t* samples, size_t count, const LightCurve& light, uint8_t* levels) {
-  for (size_t i = 0; i < count; ++i) levels[i] = light.level[static_cast<size_t>(std::clamp<int32_t>(samples[i], 0, LightCurve::kMost))];
+  for (size_t i = 0; i < count; ++i)
+    levels[i] =
+        light.level[static_cast<size_t>(std::clamp<int32_t>(samples[i], 0, LightCurve::kMost))];
 }
 
 // What all bands of one picture on its way to another size share.
@@ -183,7 +199,8 @@ struct ResamplePlan {
   size_t samples = 0;   // of a row that is weighed
   mutable FilterWindows across, down;
 
-  Status Make(const PackedImage& source, const PackedImage* plane, Reach reach, Size target, const ScaleOptions& options) {
+  Status Make(const PackedImage& source, const PackedImage* plane, Reach reach, Size target,
+              const ScaleOptions& options) {
     image = &source;
     alpha = plane;
     light = options.linear ? &Light() : nullptr;
@@ -192,16 +209,19 @@ struct ResamplePlan {
     size = target;
     channels = plane != nullptr ? 4 : 3;
     acrossFirst = target.height > rows.count;
-    samples = static_cast<size_t>(acrossFirst ? target.width : columns.count) * static_cast<size_t>(channels);
-    direct = !acrossFirst && source.Bits() == 24 && plane == nullptr && light == nullptr && columns.block == 1 &&
-             rows.block == 1 && samples >= kWeighedAtOnce;
+    samples = static_cast<size_t>(acrossFirst ? target.width : columns.count) *
+              static_cast<size_t>(channels);
+    direct = !acrossFirst && source.Bits() == 24 && plane == nullptr && light == nullptr &&
+             columns.block == 1 && rows.block == 1 && samples >= kWeighedAtOnce;
     RETURN_IF_BAD(across.Make(columns.Edge(reach.width), target.width, options.filter, kMostShortShift));
-    return down.Make(rows.Edge(reach.height), target.height, options.filter, direct ? kMostByteShift : kMostShortShift);
+    return down.Make(rows.Edge(reach.height), target.height, options.filter,
+                     direct ? kMostByteShift : kMostShortShift);
   }
 };
 
-// A band of rows of the result, in two passes: down, rows are weighed into one; across, a row is scaled. A picture that gets
-// fewer rows goes down first, so that less is left to scale across; one that gets more goes across first.
+// A band of rows of the result, in two passes: down, rows are weighed into one; across, a row is
+// scaled. A picture that gets fewer rows goes down first, so that less is left to scale across; one
+// that gets more goes across first.
 class Resampling {
  public:
   // From row `first` of the result on. The plan must outlive it.
@@ -209,15 +229,22 @@ class Resampling {
     plan_ = &plan;
     lastRow_ = plan.rows.count - 1;
     filled_ = plan.down.Window(first).first;
-    if (!plan.direct) RETURN_IF_BAD(source_.Open(*plan.image, plan.alpha, plan.light, plan.columns, plan.rows));
+    if (!plan.direct)
+      RETURN_IF_BAD(source_.Open(*plan.image, plan.alpha, plan.light, plan.columns, plan.rows));
     held_ = plan.down.MostTaps();
-    stride_ = plan.direct ? plan.samples : (plan.samples + kSpare + kWeighedAtOnce - 1) / kWeighedAtOnce * kWeighedAtOnce;
+    stride_ = plan.direct
+                  ? plan.samples
+                  : (plan.samples + kSpare + kWeighedAtOnce - 1) / kWeighedAtOnce * kWeighedAtOnce;
     const auto channels = static_cast<uint64_t>(plan.channels);
-    const uint64_t columnRow = static_cast<uint64_t>(plan.columns.count + kTapGroup) * channels + kWeighedAtOnce + kSpare;
-    const uint64_t pixelRow = static_cast<uint64_t>(plan.size.width) * channels + kWeighedAtOnce + kSpare;
-    const bool room = columns_.Allocate(columnRow * sizeof(int16_t)) && pixels_.Allocate(pixelRow * sizeof(int16_t)) &&
-                      pointers_.Allocate(static_cast<uint64_t>(held_) * sizeof(void*)) &&
-                      (plan.direct || ring_.Allocate(stride_ * static_cast<uint64_t>(held_) * sizeof(int16_t)));
+    const uint64_t columnRow =
+        static_cast<uint64_t>(plan.columns.count + kTapGroup) * channels + kWeighedAtOnce + kSpare;
+    const uint64_t pixelRow =
+        static_cast<uint64_t>(plan.size.width) * channels + kWeighedAtOnce + kSpare;
+    const bool room =
+        columns_.Allocate(columnRow * sizeof(int16_t)) &&
+        pixels_.Allocate(pixelRow * sizeof(int16_t)) &&
+        pointers_.Allocate(static_cast<uint64_t>(held_) * sizeof(void*)) &&
+        (plan.direct || ring_.Allocate(stride_ * static_cast<uint64_t>(held_) * sizeof(int16_t)));
     return room ? Status::Ok : Status::MemoryAllocationError;
   }
 
@@ -246,22 +273,28 @@ class Resampling {
 
   void Across(const int16_t* columns, int16_t* pixels) {
     const auto scale = plan_->channels == 3 ? kernels_.scaleThree : kernels_.scaleFour;
-    scale(columns, plan_->across.Windows().data(), plan_->size.width, plan_->across.Shift(), pixels);
+    scale(columns, plan_->across.Windows().data(), plan_->size.width, plan_->across.Shift(),
+          pixels);
   }
 
   void Down(int32_t y, int16_t* row) {
     const FilterWindow& window = plan_->down.Window(y);
     if (plan_->direct) {
-      const auto rows = RowsOf<uint8_t>(window, [&](int32_t r) { return plan_->image->Row(r).data(); });
+      const auto rows =
+          RowsOf<uint8_t>(window, [&](int32_t r) { return plan_->image->Row(r).data(); });
       kernels_.weighBytes(rows, window, plan_->down.Shift() - kFraction, stride_, row);
       return;
     }
-    for (const int32_t end = std::min(window.first + window.taps, lastRow_ + 1); filled_ < end; ++filled_) Fill(filled_);
+    for (const int32_t end = std::min(window.first + window.taps, lastRow_ + 1); filled_ < end;
+         ++filled_)
+      Fill(filled_);
     const auto rows = RowsOf<int16_t>(window, [&](int32_t r) { return Slot(r); });
     kernels_.weighShorts(rows, window, plan_->down.Shift(), stride_, row);
   }
 
-  int16_t* Slot(int32_t y) { return ring_.Items<int16_t>().data() + static_cast<size_t>(y % held_) * stride_; }
+  int16_t* Slot(int32_t y) {
+    return ring_.Items<int16_t>().data() + static_cast<size_t>(y % held_) * stride_;
+  }
   void Fill(int32_t y) {
     if (plan_->acrossFirst) {
       source_.Read(y, columns_.Items<int16_t>().data());
@@ -293,13 +326,15 @@ class Resampling {
 
 constexpr int32_t kLeastRows = 32;  // of a band, so that little is computed twice
 
-Status ScaleInBands(const ResamplePlan& plan, const ScaleOptions& options, PackedImage& made, PackedImage& madeAlpha) {
+Status ScaleInBands(const ResamplePlan& plan, const ScaleOptions& options, PackedImage& made,
+                    PackedImage& madeAlpha) {
   ProgressSink* const progress = options.work.threads != 1 ? nullptr : options.progress;
   return ForBands(plan.size.height, kLeastRows, options.work, [&](int32_t first, int32_t end) {
     Resampling work;
     RETURN_IF_BAD(work.Open(plan, first));
     for (int32_t y = first; y < end; ++y) {
-      work.ScaleRow(y, made.Row(y), plan.alpha != nullptr ? madeAlpha.Row(y) : std::span<uint8_t>());
+      work.ScaleRow(y, made.Row(y),
+                    plan.alpha != nullptr ? madeAlpha.Row(y) : std::span<uint8_t>());
       if (progress != nullptr) progress->Step(y + 1, plan.size.height);
     }
     return Status::Ok;
@@ -308,19 +343,22 @@ Status ScaleInBands(const ResamplePlan& plan, const ScaleOptions& options, Packe
 
 }  // namespace
 
-Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Size size, ScaleFilter filter, PackedImage& scaled,
-                     PackedImage& scaledAlpha, ProgressSink* progress) {
+Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Size size,
+                     ScaleFilter filter, PackedImage& scaled, PackedImage& scaledAlpha,
+                     ProgressSink* progress) {
   const Reach all{static_cast<double>(image.Width()), static_cast<double>(image.Height())};
   return ScaleFiltered(image, alpha, all, size, filter, scaled, scaledAlpha, progress);
 }
 
-Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Reach reach, Size size, ScaleFilter filter,
-                     PackedImage& scaled, PackedImage& scaledAlpha, ProgressSink* progress) {
-  return ScaleFiltered(image, alpha, reach, size, {.filter = filter, .progress = progress}, scaled, scaledAlpha);
+Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Reach reach, Size size,
+                     ScaleFilter filter, PackedImage& scaled, PackedImage& scaledAlpha,
+                     ProgressSink* progress) {
+  return ScaleFiltered(image, alpha, reach, size, {.filter = filter, .progress = progress}, scaled,
+                       scaledAlpha);
 }
 
-Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Reach reach, Size size, const ScaleOptions& options,
-                     PackedImage& scaled, PackedImage& scaledAlpha) {
+Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Reach reach, Size size,
+                     const ScaleOptions& options, PackedImage& scaled, PackedImage& scaledAlpha) {
   scaled.Free();
   scaledAlpha.Free();
   if (image.Empty()) return Status::DamagedFile;
@@ -332,7 +370,8 @@ Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Reach r
     RETURN_IF_BAD(NewPackedImage(size.width, size.height, nullptr, 24, made));
     if (!alpha.Empty()) RETURN_IF_BAD(NewAlphaPlane(size.width, size.height, madeAlpha));
     const bool blended = !alpha.Empty() && !IsOpaque(alpha);
-    if (!alpha.Empty() && !blended) std::memset(madeAlpha.Rows().data(), 255, madeAlpha.Rows().size());
+    if (!alpha.Empty() && !blended)
+      std::memset(madeAlpha.Rows().data(), 255, madeAlpha.Rows().size());
     ResamplePlan plan;
     RETURN_IF_BAD(plan.Make(image, blended ? &alpha : nullptr, reach, size, options));
     RETURN_IF_BAD(ScaleInBands(plan, options, made, madeAlpha));

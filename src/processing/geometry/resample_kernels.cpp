@@ -26,13 +26,23 @@ inline T LoadAs(const void* bytes) {
 }
 
 inline Shorts Load(const int16_t* samples) { return LoadAs<Shorts>(samples); }
-inline Shorts Load(const uint8_t* levels) { return __builtin_convertvector(LoadAs<EightBytes>(levels), Shorts); }
-inline Shorts InterleaveLow(Shorts a, Shorts b) { return __builtin_shufflevector(a, b, 0, 8, 1, 9, 2, 10, 3, 11); }
-inline Shorts InterleaveHigh(Shorts a, Shorts b) { return __builtin_shufflevector(a, b, 4, 12, 5, 13, 6, 14, 7, 15); }
+inline Shorts Load(const uint8_t* levels) {
+  return __builtin_convertvector(LoadAs<EightBytes>(levels), Shorts);
+}
+inline Shorts InterleaveLow(Shorts a, Shorts b) {
+  return __builtin_shufflevector(a, b, 0, 8, 1, 9, 2, 10, 3, 11);
+}
+inline Shorts InterleaveHigh(Shorts a, Shorts b) {
+  return __builtin_shufflevector(a, b, 4, 12, 5, 13, 6, 14, 7, 15);
+}
 
 #if defined(__SSE2__)
-inline Ints MultiplyAddPairs(Shorts a, Shorts b) { return (Ints)_mm_madd_epi16((__m128i)a, (__m128i)b); }
-inline Shorts Pack(Ints low, Ints high) { return (Shorts)_mm_packs_epi32((__m128i)low, (__m128i)high); }
+inline Ints MultiplyAddPairs(Shorts a, Shorts b) {
+  return (Ints)_mm_madd_epi16((__m128i)a, (__m128i)b);
+}
+inline Shorts Pack(Ints low, Ints high) {
+  return (Shorts)_mm_packs_epi32((__m128i)low, (__m128i)high);
+}
 #else
 inline Ints MultiplyAddPairs(Shorts a, Shorts b) {
   Ints sum;
@@ -53,7 +63,9 @@ inline uint64_t PackSamples(FourInts samples) {
   return LoadAs<uint64_t>(&shorts);
 }
 
-inline Shorts TwoWeights(const int16_t* weights) { return (Shorts)(Ints{} + LoadAs<int32_t>(weights)); }
+inline Shorts TwoWeights(const int16_t* weights) {
+  return (Shorts)(Ints{} + LoadAs<int32_t>(weights));
+}
 inline Shorts WeightsOfPairs(const int16_t* weights) { return TwoWeights(weights); }
 // Two pixels, channel by channel.
 template <int channels>
@@ -83,7 +95,9 @@ inline T LoadAs(const void* bytes) {
 }
 
 inline Shorts Load(const int16_t* samples) { return LoadAs<Shorts>(samples); }
-inline Shorts Load(const uint8_t* levels) { return (Shorts)_mm256_cvtepu8_epi16(LoadAs<__m128i>(levels)); }
+inline Shorts Load(const uint8_t* levels) {
+  return (Shorts)_mm256_cvtepu8_epi16(LoadAs<__m128i>(levels));
+}
 // Within each half of 16 bytes; Pack puts the order right again.
 inline Shorts InterleaveLow(Shorts a, Shorts b) {
   return __builtin_shufflevector(a, b, 0, 16, 1, 17, 2, 18, 3, 19, 8, 24, 9, 25, 10, 26, 11, 27);
@@ -91,14 +105,20 @@ inline Shorts InterleaveLow(Shorts a, Shorts b) {
 inline Shorts InterleaveHigh(Shorts a, Shorts b) {
   return __builtin_shufflevector(a, b, 4, 20, 5, 21, 6, 22, 7, 23, 12, 28, 13, 29, 14, 30, 15, 31);
 }
-inline Ints MultiplyAddPairs(Shorts a, Shorts b) { return (Ints)_mm256_madd_epi16((__m256i)a, (__m256i)b); }
-inline Shorts Pack(Ints low, Ints high) { return (Shorts)_mm256_packs_epi32((__m256i)low, (__m256i)high); }
+inline Ints MultiplyAddPairs(Shorts a, Shorts b) {
+  return (Ints)_mm256_madd_epi16((__m256i)a, (__m256i)b);
+}
+inline Shorts Pack(Ints low, Ints high) {
+  return (Shorts)_mm256_packs_epi32((__m256i)low, (__m256i)high);
+}
 inline uint64_t PackSamples(FourInts samples) {
   const __m128i shorts = _mm_packs_epi32((__m128i)samples, (__m128i)samples);
   return LoadAs<uint64_t>(&shorts);
 }
 
-inline Shorts TwoWeights(const int16_t* weights) { return (Shorts)(Ints{} + LoadAs<int32_t>(weights)); }
+inline Shorts TwoWeights(const int16_t* weights) {
+  return (Shorts)(Ints{} + LoadAs<int32_t>(weights));
+}
 inline Shorts WeightsOfPairs(const int16_t* weights) {
   const Ints both = (Ints)_mm256_set1_epi64x(LoadAs<int64_t>(weights));
   return (Shorts)__builtin_shufflevector(both, both, 0, 0, 0, 0, 1, 1, 1, 1);
@@ -106,16 +126,21 @@ inline Shorts WeightsOfPairs(const int16_t* weights) {
 // Four pixels, two in each half, channel by channel.
 template <int channels>
 inline Shorts LoadPixelPairs(const int16_t* pixels) {
-  const EightShorts low = LoadAs<EightShorts>(pixels), high = LoadAs<EightShorts>(pixels + 2 * channels);
-  const Shorts four = __builtin_shufflevector(low, high, 0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15);
+  const EightShorts low = LoadAs<EightShorts>(pixels),
+                    high = LoadAs<EightShorts>(pixels + 2 * channels);
+  const Shorts four =
+      __builtin_shufflevector(low, high, 0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15);
   if constexpr (channels == 3) {
-    return __builtin_shufflevector(four, four, 0, 3, 1, 4, 2, 5, 6, 7, 8, 11, 9, 12, 10, 13, 14, 15);
+    return __builtin_shufflevector(four, four, 0, 3, 1, 4, 2, 5, 6, 7, 8, 11, 9, 12, 10, 13, 14,
+                                   15);
   } else {
-    return __builtin_shufflevector(four, four, 0, 4, 1, 5, 2, 6, 3, 7, 8, 12, 9, 13, 10, 14, 11, 15);
+    return __builtin_shufflevector(four, four, 0, 4, 1, 5, 2, 6, 3, 7, 8, 12, 9, 13, 10, 14, 11,
+                                   15);
   }
 }
 inline FourInts AddHalves(Ints sum) {
-  return __builtin_shufflevector(sum, sum, 0, 1, 2, 3) + __builtin_shufflevector(sum, sum, 4, 5, 6, 7);
+  return __builtin_shufflevector(sum, sum, 0, 1, 2, 3) +
+         __builtin_shufflevector(sum, sum, 4, 5, 6, 7);
 }
 
 #include "processing/geometry/resample_kernels.inc"

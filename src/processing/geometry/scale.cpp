@@ -13,19 +13,24 @@ namespace fotomill {
 namespace {
 
 // In the order of choice::ResampleFilter.
-constexpr ScaleFilter kFilterOfKey[] = {ScaleFilter::Bicubic, ScaleFilter::Lanczos, ScaleFilter::Bilinear, ScaleFilter::Nearest};
-static_assert(kFilterOfKey[choice::kBicubic] == ScaleFilter::Bicubic && kFilterOfKey[choice::kLanczos] == ScaleFilter::Lanczos &&
-              kFilterOfKey[choice::kBilinear] == ScaleFilter::Bilinear && kFilterOfKey[choice::kNearest] == ScaleFilter::Nearest);
+constexpr ScaleFilter kFilterOfKey[] = {ScaleFilter::Bicubic, ScaleFilter::Lanczos,
+                                        ScaleFilter::Bilinear, ScaleFilter::Nearest};
+static_assert(kFilterOfKey[choice::kBicubic] == ScaleFilter::Bicubic &&
+              kFilterOfKey[choice::kLanczos] == ScaleFilter::Lanczos &&
+              kFilterOfKey[choice::kBilinear] == ScaleFilter::Bilinear &&
+              kFilterOfKey[choice::kNearest] == ScaleFilter::Nearest);
 
 // The source pixel under the middle of pixel `i` of `count`.
 constexpr int32_t SourcePixel(int32_t i, int32_t count, int32_t sourceCount) {
-  return static_cast<int32_t>((2 * static_cast<int64_t>(i) + 1) * sourceCount / (2 * static_cast<int64_t>(count)));
+  return static_cast<int32_t>((2 * static_cast<int64_t>(i) + 1) * sourceCount /
+                              (2 * static_cast<int64_t>(count)));
 }
 
 template <int bytes>
 void PickPixels(const uint8_t* row, const int32_t* columns, int32_t count, uint8_t* picked) {
   for (int32_t x = 0; x < count; ++x) {
-    std::memcpy(picked + static_cast<size_t>(x) * bytes, row + static_cast<size_t>(columns[x]) * bytes, bytes);
+    std::memcpy(picked + static_cast<size_t>(x) * bytes,
+                row + static_cast<size_t>(columns[x]) * bytes, bytes);
   }
 }
 
@@ -57,7 +62,9 @@ Size SizeAtPercentage(int32_t width, int32_t height, int32_t percentage) {
   return {AtPercentage(width, percentage), AtPercentage(height, percentage)};
 }
 
-ScaleFilter ScaleFilterFromKey(int32_t value) { return kFilterOfKey[std::clamp<int32_t>(value, 0, std::size(kFilterOfKey) - 1)]; }
+ScaleFilter ScaleFilterFromKey(int32_t value) {
+  return kFilterOfKey[std::clamp<int32_t>(value, 0, std::size(kFilterOfKey) - 1)];
+}
 
 Status ScaleNearest(const PackedImage& image, Size size, PackedImage& scaled) {
   scaled.Free();
@@ -70,7 +77,8 @@ Status ScaleNearest(const PackedImage& image, Size size, PackedImage& scaled) {
     RETURN_IF_BAD(NewPackedImage(size.width, size.height, nullptr, image.Bits(), made));
     std::copy(image.ColorTable().begin(), image.ColorTable().end(), made.ColorTable().begin());
     for (int32_t r = 0; r < size.height; ++r) {
-      PackIndices(deepScaled.StoredRow(r).data(), size.width, image.Bits(), made.StoredRow(r).data());
+      PackIndices(deepScaled.StoredRow(r).data(), size.width, image.Bits(),
+                  made.StoredRow(r).data());
     }
     scaled = std::move(made);
     return Status::Ok;
@@ -101,12 +109,15 @@ Status ScaleNearest(const PackedImage& image, Size size, PackedImage& scaled) {
 
 Status ScalePictureByPercentage(PictureRecord& picture, int32_t percentage) {
   if (picture.image.Empty()) return Status::EmptyImage;
-  return ScalePicture(picture, SizeAtPercentage(picture.image.Width(), picture.image.Height(), percentage), ScaleFilter::Nearest);
+  return ScalePicture(picture,
+                      SizeAtPercentage(picture.image.Width(), picture.image.Height(), percentage),
+                      ScaleFilter::Nearest);
 }
 
 Status ScalePicture(PictureRecord& picture, Size size, const ScaleOptions& options) {
   if (picture.image.Empty()) return Status::EmptyImage;
-  const Reach all{static_cast<double>(picture.image.Width()), static_cast<double>(picture.image.Height())};
+  const Reach all{static_cast<double>(picture.image.Width()),
+                  static_cast<double>(picture.image.Height())};
   PackedImage image, alpha;
   RETURN_IF_BAD(ScaleFiltered(picture.image, picture.alpha, all, size, options, image, alpha));
   Replace(picture, image, alpha);

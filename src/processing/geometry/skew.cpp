@@ -14,14 +14,18 @@ namespace fotomill {
 namespace {
 
 constexpr int32_t kSide = 1500;         // the longest edge of what is looked at
-constexpr int32_t kLeastContrast = 24;  // levels between a pixel and the one below it that make an edge
-constexpr double kSteps[] = {0.5, 0.1, 0.02};  // degrees: each search goes two steps of the one before to either side
+// levels between a pixel and the one below it that make an edge
+constexpr int32_t kLeastContrast = 24;
+// degrees: each search goes two steps of the one before to either side
+constexpr double kSteps[] = {0.5, 0.1, 0.02};
 
 struct Dot {
   int32_t x, y;
 };
 
-int32_t LumaOf(const uint8_t* bgr) { return (114 * bgr[0] + 587 * bgr[1] + 299 * bgr[2] + 500) / 1000; }
+int32_t LumaOf(const uint8_t* bgr) {
+  return (114 * bgr[0] + 587 * bgr[1] + 299 * bgr[2] + 500) / 1000;
+}
 
 Status FindEdges(const PackedImage& image, std::vector<Dot>& dots) {
   BgrRows rows;
@@ -40,7 +44,8 @@ Status FindEdges(const PackedImage& image, std::vector<Dot>& dots) {
   return Status::Ok;
 }
 
-uint64_t Score(const std::vector<Dot>& dots, double degrees, std::vector<uint32_t>& counts, int32_t width) {
+uint64_t Score(const std::vector<Dot>& dots, double degrees, std::vector<uint32_t>& counts,
+               int32_t width) {
   const double slope = std::tan(degrees * std::numbers::pi / 180);
   std::ranges::fill(counts, 0u);
   // In 1 / 65536 of a row, so that the sums are the same everywhere.
@@ -71,7 +76,8 @@ Status FindSkew(const PictureRecord& picture, double most, const Work& work, dou
   std::vector<Dot> dots;
   RETURN_IF_BAD(FindEdges(*page, dots));
   if (dots.empty()) return Status::Ok;
-  std::vector<uint32_t> counts(static_cast<size_t>(page->Height()) + 2 * static_cast<size_t>(page->Width()) + 2);
+  std::vector<uint32_t> counts(static_cast<size_t>(page->Height()) +
+                               2 * static_cast<size_t>(page->Width()) + 2);
   double best = 0, range = most;
   uint64_t bestScore = Score(dots, 0, counts, page->Width());
   for (const double step : kSteps) {

@@ -12,7 +12,8 @@ namespace fotomill {
 
 namespace {
 
-constexpr int32_t kTile = 512;  // columns: the rows of the source under them stay in the processor's cache
+// columns: the rows of the source under them stay in the processor's cache
+constexpr int32_t kTile = 512;
 constexpr int32_t kLeastRows = 16;
 constexpr int32_t kPhaseBits = 10;
 constexpr size_t kPhases = size_t{1} << kPhaseBits;
@@ -35,17 +36,20 @@ double WeightOf(WarpFilter filter, double distance) {
   return distance > -0.5 && distance <= 0.5 ? 1 : 0;
 }
 
-// The weights of the pixels at -1, 0, 1 and 2 for a place between 0 and 1. What rounding leaves over goes to the nearer one.
+// The weights of the pixels at -1, 0, 1 and 2 for a place between 0 and 1. What rounding leaves
+// over goes to the nearer one.
 WeightTable WeightsOf(WarpFilter filter) {
   WeightTable table;
   for (size_t phase = 0; phase < kPhases; ++phase) {
     const double place = static_cast<double>(phase) / kPhases;
     int32_t left = kWeightOne;
     for (int32_t i = 0; i < kTaps; ++i) {
-      table[phase][i] = static_cast<int16_t>(std::lround(WeightOf(filter, i - 1 - place) * kWeightOne));
+      table[phase][i] =
+          static_cast<int16_t>(std::lround(WeightOf(filter, i - 1 - place) * kWeightOne));
       left -= table[phase][i];
     }
-    table[phase][place < 0.5 ? 1 : 2] = static_cast<int16_t>(table[phase][place < 0.5 ? 1 : 2] + left);
+    table[phase][place < 0.5 ? 1 : 2] =
+        static_cast<int16_t>(table[phase][place < 0.5 ? 1 : 2] + left);
   }
   return table;
 }
@@ -56,7 +60,8 @@ struct Phased {
   size_t phase;
 
   explicit Phased(int64_t place) {
-    const int64_t phases = (place + (int64_t{1} << (kPlaceBits - kPhaseBits - 1))) >> (kPlaceBits - kPhaseBits);
+    const int64_t phases =
+        (place + (int64_t{1} << (kPlaceBits - kPhaseBits - 1))) >> (kPlaceBits - kPhaseBits);
     first = (phases >> kPhaseBits) - 1;
     phase = static_cast<size_t>(phases) % kPhases;
   }
@@ -69,7 +74,8 @@ struct Patch {
 };
 
 // The pixel of a patch whose colors count by their alpha.
-void SampleAlpha(const Patch& patch, const Weights& across, const Weights& down, uint8_t* bgr, uint8_t* opacity) {
+void SampleAlpha(const Patch& patch, const Weights& across, const Weights& down, uint8_t* bgr,
+                 uint8_t* opacity) {
   int64_t sums[3] = {}, weight = 0;
   for (int j = 0; j < kTaps; ++j) {
     for (int i = 0; i < kTaps; ++i) {
@@ -80,10 +86,12 @@ void SampleAlpha(const Patch& patch, const Weights& across, const Weights& down,
   }
   constexpr int32_t kBits = 2 * kWeightBits;
   for (int c = 0; c < 3; ++c) {
-    bgr[c] = weight <= 0 || sums[c] <= 0 ? uint8_t{0}
-                                         : static_cast<uint8_t>(std::min<int64_t>(255, (sums[c] + weight / 2) / weight));
+    bgr[c] = weight <= 0 || sums[c] <= 0
+                 ? uint8_t{0}
+                 : static_cast<uint8_t>(std::min<int64_t>(255, (sums[c] + weight / 2) / weight));
   }
-  *opacity = static_cast<uint8_t>(std::clamp<int64_t>((weight + (1 << (kBits - 1))) >> kBits, 0, 255));
+  *opacity =
+      static_cast<uint8_t>(std::clamp<int64_t>((weight + (1 << (kBits - 1))) >> kBits, 0, 255));
 }
 
 struct Warp {
@@ -92,20 +100,29 @@ struct Warp {
   const WarpOptions& options;
   WeightTable weights;
   std::ptrdiff_t down;  // from a row to the one below
-  // How far the first pixel of sixteen may be from the left and from the top with all that is read inside the picture.
+  // How far the first pixel of sixteen may be from the left and from the top with all that is read
+  // inside the picture.
   uint64_t mostLeft, mostTop;
 
   Warp(const PackedImage& source, const PackedImage* plane, const WarpOptions& how)
-      : image(source), alpha(plane), options(how), weights(WeightsOf(how.filter)), down(-static_cast<std::ptrdiff_t>(source.Stride())),
-        mostLeft(static_cast<uint64_t>(std::max(source.Width() - 5, 0))), mostTop(static_cast<uint64_t>(std::max(source.Height() - 3, 0))) {}
+      : image(source),
+        alpha(plane),
+        options(how),
+        weights(WeightsOf(how.filter)),
+        down(-static_cast<std::ptrdiff_t>(source.Stride())),
+        mostLeft(static_cast<uint64_t>(std::max(source.Width() - 5, 0))),
+        mostTop(static_cast<uint64_t>(std::max(source.Height() - 3, 0))) {}
 
-  const uint8_t* Pixel(int64_t x, int64_t y) const { return image.Row(static_cast<int32_t>(y)).data() + 3 * x; }
+  const uint8_t* Pixel(int64_t x, int64_t y) const {
+    return image.Row(static_cast<int32_t>(y)).data() + 3 * x;
+  }
 
   bool IsFarOutside(int64_t left, int64_t top) const {
     return left + kTaps <= 0 || top + kTaps <= 0 || left >= image.Width() || top >= image.Height();
   }
 
-  // Collects sixteen pixels, some of which may be outside; `opaque`: the alpha of pixels of a picture without alpha.
+  // Collects sixteen pixels, some of which may be outside; `opaque`: the alpha of pixels of a
+  // picture without alpha.
   void Collect(int64_t left, int64_t top, Patch& patch) const {
     const int64_t width = image.Width(), height = image.Height();
     for (int64_t j = 0; j < kTaps; ++j) {
@@ -121,7 +138,9 @@ struct Warp {
           pixel[1] = options.backdrop.green;
           pixel[2] = options.backdrop.red;
         }
-        const uint8_t own = alpha == nullptr ? uint8_t{255} : alpha->Row(static_cast<int32_t>(y))[static_cast<size_t>(x)];
+        const uint8_t own = alpha == nullptr
+                                ? uint8_t{255}
+                                : alpha->Row(static_cast<int32_t>(y))[static_cast<size_t>(x)];
         patch.alpha[j][i] = isInside ? own : options.backdrop.alpha;
       }
     }
@@ -173,7 +192,8 @@ struct Warp {
 
 int64_t Fixed(double pixels) {
   constexpr double kFar = 1 << 30;
-  return static_cast<int64_t>(std::floor(std::clamp(pixels, -kFar, kFar) * (int64_t{1} << kPlaceBits) + 0.5));
+  return static_cast<int64_t>(
+      std::floor(std::clamp(pixels, -kFar, kFar) * (int64_t{1} << kPlaceBits) + 0.5));
 }
 
 }  // namespace
@@ -196,22 +216,26 @@ PlaceRow LinearPlaces(const LinearMap& map) {
 
 LinearMap MapAboutCenter(Size from, Size to, double xx, double xy, double yx, double yy) {
   const double x = (to.width - 1) / 2.0, y = (to.height - 1) / 2.0;
-  return {xx, xy, (from.width - 1) / 2.0 - xx * x - xy * y, yx, yy, (from.height - 1) / 2.0 - yx * x - yy * y};
+  return {xx, xy, (from.width - 1) / 2.0 - xx * x - xy * y,
+          yx, yy, (from.height - 1) / 2.0 - yx * x - yy * y};
 }
 
-Status WarpPicture(PictureRecord& picture, Size size, const WarpOptions& options, const PlaceRow& places, const Work& work) {
+Status WarpPicture(PictureRecord& picture, Size size, const WarpOptions& options,
+                   const PlaceRow& places, const Work& work) {
   if (picture.image.Empty()) return Status::EmptyImage;
   PackedImage image, alpha;
   RETURN_IF_BAD(CheckPackedSize(size.width, size.height, 24));
   RETURN_IF_BAD(PromotePicture(picture));
-  const bool hasAlpha = !picture.alpha.Empty(), getsAlpha = hasAlpha || (!options.edgesRepeat && options.backdrop.alpha < 255);
+  const bool hasAlpha = !picture.alpha.Empty(),
+             getsAlpha = hasAlpha || (!options.edgesRepeat && options.backdrop.alpha < 255);
   RETURN_IF_BAD(NewPackedImage(size.width, size.height, nullptr, 24, image));
   if (getsAlpha) RETURN_IF_BAD(NewAlphaPlane(size.width, size.height, alpha));
   const Warp warp(picture.image, hasAlpha ? &picture.alpha : nullptr, options);
   RETURN_IF_BAD(ForBands(size.height, kLeastRows, work, [&](int32_t first, int32_t end) {
     std::array<SourcePlace, kTile> tile;
     for (int32_t left = 0; left < size.width; left += kTile) {
-      const std::span<SourcePlace> wanted(tile.data(), static_cast<size_t>(std::min(kTile, size.width - left)));
+      const std::span<SourcePlace> wanted(tile.data(),
+                                          static_cast<size_t>(std::min(kTile, size.width - left)));
       for (int32_t y = first; y < end; ++y) {
         places(left, y, wanted);
         uint8_t* bgr = image.Row(y).data() + 3 * static_cast<size_t>(left);

@@ -38,7 +38,8 @@ struct Table {
   Palette palette{};
   int32_t count = 0;
 
-  // Reads the three numbers at the start of a line. False when they are not there or the table is full.
+  // Reads the three numbers at the start of a line. False when they are not there or the table is
+  // full.
   bool Add(std::string_view& line) {
     if (count == kMostColors) return false;
     for (size_t c = 0; c < 3; ++c) {
@@ -78,7 +79,8 @@ bool ReadGimp(std::string_view text, Table& table) {
   while (!text.empty()) {  // headers
     std::string_view rest = text;
     const std::string_view line = TakeLine(rest);
-    const bool header = line.starts_with("Name:") || line.starts_with("Columns:") || line.starts_with('#') || line.empty();
+    const bool header = line.starts_with("Name:") || line.starts_with("Columns:") ||
+                        line.starts_with('#') || line.empty();
     if (!header) break;
     text = rest;
   }
@@ -101,7 +103,9 @@ Status ReadColorTable(std::string_view contents, Palette& palette, int32_t& coun
   std::string_view rest = contents;
   const std::string_view first = TakeLine(rest);
   const bool act = contents.size() == kActBytes || contents.size() == kActBytes + kActTrailer;
-  bool read = first == kGimp ? ReadGimp(contents, table) : first == kJasc ? ReadJasc(contents, table) : false;
+  bool read = first == kGimp   ? ReadGimp(contents, table)
+              : first == kJasc ? ReadJasc(contents, table)
+                               : false;
   if (first != kGimp && first != kJasc) {
     read = ReadLines(contents, false, table);
     if (!read && act) {  // text of just that length is text

@@ -7,10 +7,13 @@ namespace fotomill {
 
 namespace {
 
-constexpr ErrorShare kAtkinson[] = {{1, 0, 1}, {2, 0, 1}, {-1, 1, 1}, {0, 1, 1}, {1, 1, 1}, {0, 2, 1}};
-constexpr ErrorShare kStucki[] = {{1, 0, 8},  {2, 0, 4},  {-2, 1, 2}, {-1, 1, 4}, {0, 1, 8}, {1, 1, 4},
-                                  {2, 1, 2},  {-2, 2, 1}, {-1, 2, 2}, {0, 2, 4},  {1, 2, 2}, {2, 2, 1}};
-constexpr ErrorShare kBurkes[] = {{1, 0, 8}, {2, 0, 4}, {-2, 1, 2}, {-1, 1, 4}, {0, 1, 8}, {1, 1, 4}, {2, 1, 2}};
+constexpr ErrorShare kAtkinson[] = {{1, 0, 1}, {2, 0, 1}, {-1, 1, 1},
+                                    {0, 1, 1}, {1, 1, 1}, {0, 2, 1}};
+constexpr ErrorShare kStucki[] = {{1, 0, 8},  {2, 0, 4}, {-2, 1, 2}, {-1, 1, 4},
+                                  {0, 1, 8},  {1, 1, 4}, {2, 1, 2},  {-2, 2, 1},
+                                  {-1, 2, 2}, {0, 2, 4}, {1, 2, 2},  {2, 2, 1}};
+constexpr ErrorShare kBurkes[] = {{1, 0, 8}, {2, 0, 4}, {-2, 1, 2}, {-1, 1, 4},
+                                  {0, 1, 8}, {1, 1, 4}, {2, 1, 2}};
 constexpr ErrorShare kSierra[] = {{1, 0, 5}, {2, 0, 3}, {-2, 1, 2}, {-1, 1, 4}, {0, 1, 5},
                                   {1, 1, 4}, {2, 1, 2}, {-1, 2, 2}, {0, 2, 3},  {1, 2, 2}};
 
@@ -30,7 +33,8 @@ DiffusionKernel KernelOf(Dither dither) {
 Status WideDiffuser::Open(Dither dither, int32_t width, bool serpentine, int32_t handedOn) {
   kernel_ = KernelOf(dither);
   stride_ = 3 * (static_cast<std::ptrdiff_t>(width) + 2 * kReach);
-  if (!block_.Allocate(static_cast<uint64_t>(stride_) * kRows * sizeof(int32_t))) return Status::MemoryAllocationError;
+  if (!block_.Allocate(static_cast<uint64_t>(stride_) * kRows * sizeof(int32_t)))
+    return Status::MemoryAllocationError;
   errors_ = block_.Items<int32_t>().data();
   width_ = width;
   serpentine_ = serpentine;
@@ -59,7 +63,8 @@ void WideDiffuser::Row(const uint8_t* bgr, NearestColor& nearest, uint8_t* indic
   std::ptrdiff_t x = step_ > 0 ? 0 : width_ - 1;
   for (int32_t left = width_; left > 0; --left, x += step_) {
     int32_t wanted[3];
-    for (int c = 0; c < 3; ++c) wanted[c] = std::clamp(bgr[3 * x + c] + ((own[3 * x + c] + kUnit / 2) >> 16), 0, 255);
+    for (int c = 0; c < 3; ++c)
+      wanted[c] = std::clamp(bgr[3 * x + c] + ((own[3 * x + c] + kUnit / 2) >> 16), 0, 255);
     const uint8_t index = nearest.Find(wanted[0], wanted[1], wanted[2]);
     indices[x] = index;
     const int16_t* color = nearest.ColorOf(index);
@@ -83,7 +88,8 @@ void WideDiffuser::GrayRow(const uint8_t* gray, uint8_t* indices) {
     const bool white = wanted >= 128;
     indices[x] = white;
     const int32_t error = wanted - (white ? 255 : 0);
-    for (int32_t i = 0; i < shares_; ++i) targets_[i].row[x + targets_[i].ahead] += error * targets_[i].factor;
+    for (int32_t i = 0; i < shares_; ++i)
+      targets_[i].row[x + targets_[i].ahead] += error * targets_[i].factor;
   }
   EndRow();
 }

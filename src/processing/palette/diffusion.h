@@ -10,7 +10,8 @@
 
 namespace fotomill {
 
-// A pixel that gets a share of another one's error: `ahead` pixels in the direction of travel, `down` rows below.
+// A pixel that gets a share of another one's error: `ahead` pixels in the direction of travel,
+// `down` rows below.
 struct ErrorShare {
   int32_t ahead, down;
   int32_t weight;  // of the kernel's divisor
@@ -20,17 +21,21 @@ struct DiffusionKernel {
   int32_t divisor;
 };
 
-// Whether a dither spreads errors as WideDiffuser does; Floyd-Steinberg has a faster class of its own.
-constexpr bool IsWideDiffusion(Dither dither) { return dither >= Dither::Atkinson && dither <= Dither::Sierra; }
-// Its kernel. Sources: Atkinson's dither of the first Macintosh (it drops a quarter of the error); Stucki, "MECCA",
-// IBM Research Report RZ1060 (1981); Burkes (1988); Sierra's filter of three rows (1989).
+// Whether a dither spreads errors as WideDiffuser does; Floyd-Steinberg has a faster class of its
+// own.
+constexpr bool IsWideDiffusion(Dither dither) {
+  return dither >= Dither::Atkinson && dither <= Dither::Sierra;
+}
+// Its kernel. Sources: Atkinson's dither of the first Macintosh (it drops a quarter of the error);
+// Stucki, "MECCA", IBM Research Report RZ1060 (1981); Burkes (1988); Sierra's filter of three rows
+// (1989).
 DiffusionKernel KernelOf(Dither dither);
 
 // Diffuses errors up to two pixels and two rows far, so it must see all rows from the top down.
 class WideDiffuser {
  public:
-  // For rows of `width` pixels; with `serpentine` every other one is taken from the right. A pixel hands on `handedOn`
-  // sixteenths of its error. MemoryAllocationError.
+  // For rows of `width` pixels; with `serpentine` every other one is taken from the right. A pixel
+  // hands on `handedOn` sixteenths of its error. MemoryAllocationError.
   Status Open(Dither dither, int32_t width, bool serpentine, int32_t handedOn);
   // As ErrorDiffuser: a row of pixels to indices, a row of brightnesses to 0 and 1.
   void Row(const uint8_t* bgr, NearestColor& nearest, uint8_t* indices);
@@ -44,7 +49,8 @@ class WideDiffuser {
   void EndRow();
 
   platform::MemoryBlock block_;
-  int32_t* errors_ = nullptr;  // three rows in turn, 65536ths of a level, two spare pixels on both sides
+  // three rows in turn, 65536ths of a level, two spare pixels on both sides
+  int32_t* errors_ = nullptr;
   std::ptrdiff_t stride_ = 0;  // numbers in a row of errors
   DiffusionKernel kernel_{};
   int32_t width_ = 0, handedOn_ = 16, row_ = 0;

@@ -7,7 +7,8 @@ namespace fotomill {
 
 namespace {
 
-// Bayer's pattern: the order in which the pixels of a square of `size` x `size` (2, 4 or 8) turn white, from 0 on.
+// Bayer's pattern: the order in which the pixels of a square of `size` x `size` (2, 4 or 8) turn
+// white, from 0 on.
 constexpr int32_t PatternOrder(int32_t size, int32_t x, int32_t y) {
   int32_t order = 0;
   for (int32_t bit = 0; 1 << bit < size; ++bit) {
@@ -16,8 +17,10 @@ constexpr int32_t PatternOrder(int32_t size, int32_t x, int32_t y) {
   }
   return order;
 }
-static_assert(PatternOrder(8, 0, 0) == 0 && PatternOrder(8, 1, 0) == 32 && PatternOrder(8, 0, 1) == 48 && PatternOrder(8, 1, 1) == 16);
-static_assert(PatternOrder(2, 1, 0) == 2 && PatternOrder(2, 0, 1) == 3 && PatternOrder(2, 1, 1) == 1);
+static_assert(PatternOrder(8, 0, 0) == 0 && PatternOrder(8, 1, 0) == 32 &&
+              PatternOrder(8, 0, 1) == 48 && PatternOrder(8, 1, 1) == 16);
+static_assert(PatternOrder(2, 1, 0) == 2 && PatternOrder(2, 0, 1) == 3 &&
+              PatternOrder(2, 1, 1) == 1);
 
 // Columns that a row of a pattern is written out for.
 constexpr int32_t kColumns = 8;
@@ -30,20 +33,25 @@ void MapRow(const uint8_t* bgr, int32_t width, NearestColor& nearest, uint8_t* i
   for (int32_t x = 0; x < width; ++x, bgr += 3) indices[x] = nearest.Find(bgr[0], bgr[1], bgr[2]);
 }
 
-void OrderRow(const uint8_t* bgr, int32_t width, int32_t y, int32_t size, int32_t spread, NearestColor& nearest, uint8_t* indices) {
+void OrderRow(const uint8_t* bgr, int32_t width, int32_t y, int32_t size, int32_t spread,
+              NearestColor& nearest, uint8_t* indices) {
   const int32_t places = size * size;
   int32_t offsets[kColumns];
-  for (int32_t i = 0; i < kColumns; ++i) offsets[i] = (2 * PatternOrder(size, i, y) - (places - 1)) * spread / (2 * places);
+  for (int32_t i = 0; i < kColumns; ++i)
+    offsets[i] = (2 * PatternOrder(size, i, y) - (places - 1)) * spread / (2 * places);
   for (int32_t x = 0; x < width; ++x, bgr += 3) {
     const int32_t offset = offsets[x & 7];
-    indices[x] = nearest.Find(Clamp(bgr[0] + offset), Clamp(bgr[1] + offset), Clamp(bgr[2] + offset));
+    indices[x] =
+        nearest.Find(Clamp(bgr[0] + offset), Clamp(bgr[1] + offset), Clamp(bgr[2] + offset));
   }
 }
 
 void OrderGrayRow(const uint8_t* gray, int32_t width, int32_t y, int32_t size, uint8_t* indices) {
-  // The shades of the pattern, one more than it has places, lie evenly between black and white: 0 is never white, 255 always is.
+  // The shades of the pattern, one more than it has places, lie evenly between black and white: 0
+  // is never white, 255 always is.
   int32_t limits[kColumns];
-  for (int32_t i = 0; i < kColumns; ++i) limits[i] = (2 * PatternOrder(size, i, y) + 1) * 255 / (2 * size * size) + 1;
+  for (int32_t i = 0; i < kColumns; ++i)
+    limits[i] = (2 * PatternOrder(size, i, y) + 1) * 255 / (2 * size * size) + 1;
   for (int32_t x = 0; x < width; ++x) indices[x] = gray[x] >= limits[x & 7];
 }
 
@@ -72,8 +80,9 @@ void ErrorDiffuser::GrayRow(const uint8_t* gray, uint8_t* indices) {
   backwards_ = serpentine_ && !backwards_;
 }
 
-// A pixel hands 7/16 of its error ahead, and 3/16, 5/16 and 1/16 down: to the pixel below the last, below itself and
-// below the next. What was handed down to a pixel is read before its own row hands on to the same place.
+// A pixel hands 7/16 of its error ahead, and 3/16, 5/16 and 1/16 down: to the pixel below the last,
+// below itself and below the next. What was handed down to a pixel is read before its own row hands
+// on to the same place.
 template <int step>
 void ErrorDiffuser::DiffuseRow(const uint8_t* bgr, NearestColor& nearest, uint8_t* indices) {
   int32_t ahead[3] = {}, belowLast[3] = {}, belowHere[3] = {};
@@ -82,7 +91,8 @@ void ErrorDiffuser::DiffuseRow(const uint8_t* bgr, NearestColor& nearest, uint8_
     int32_t* below = below_ + 3 * static_cast<std::ptrdiff_t>(x);
     int32_t wanted[3];
     for (int c = 0; c < 3; ++c)
-      wanted[c] = Clamp(bgr[3 * static_cast<std::ptrdiff_t>(x) + c] + ((ahead[c] + below[c] + 128) >> 8));
+      wanted[c] =
+          Clamp(bgr[3 * static_cast<std::ptrdiff_t>(x) + c] + ((ahead[c] + below[c] + 128) >> 8));
     const uint8_t index = nearest.Find(wanted[0], wanted[1], wanted[2]);
     indices[x] = index;
     const int16_t* color = nearest.ColorOf(index);

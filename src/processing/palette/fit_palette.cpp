@@ -90,7 +90,8 @@ std::vector<Point> CutIntoGroups(std::span<ColorBin> bins, size_t colors) {
   std::vector<Group> groups{MakeGroup(bins, 0, bins.size())};
   while (groups.size() < colors) {
     const auto worst =
-        std::max_element(groups.begin(), groups.end(), [](const Group& a, const Group& b) { return a.spread < b.spread; });
+        std::max_element(groups.begin(), groups.end(),
+                         [](const Group& a, const Group& b) { return a.spread < b.spread; });
     if (worst->spread <= 0) break;
     Group other;
     if (Split(bins, *worst, other)) {
@@ -107,12 +108,13 @@ std::vector<Point> CutIntoGroups(std::span<ColorBin> bins, size_t colors) {
 // A bin as the search for the nearest color wants it.
 std::array<int32_t, 3> PointOf(const ColorBin& bin) {
   std::array<int32_t, 3> point;
-  for (size_t c = 0; c < 3; ++c) point[c] = static_cast<int32_t>(bin.channel[c] * ColorPoints::kUnits + 0.5f);
+  for (size_t c = 0; c < 3; ++c)
+    point[c] = static_cast<int32_t>(bin.channel[c] * ColorPoints::kUnits + 0.5f);
   return point;
 }
 
-// One round: every bin goes to the color nearest to it, then every color to the mean of its bins. Returns the squared
-// error before the move.
+// One round: every bin goes to the color nearest to it, then every color to the mean of its bins.
+// Returns the squared error before the move.
 double MoveToMeans(std::span<const ColorBin> bins, NearestColor& nearest, ColorPoints& points) {
   struct Sum {
     double channel[3] = {}, weight = 0;
@@ -136,7 +138,8 @@ double MoveToMeans(std::span<const ColorBin> bins, NearestColor& nearest, ColorP
   for (size_t i = 0; i < static_cast<size_t>(points.count); ++i) {
     if (sums[i].weight <= 0) continue;
     for (size_t c = 0; c < 3; ++c) {
-      points.channel[i][c] = static_cast<int32_t>(std::lround(sums[i].channel[c] / sums[i].weight * ColorPoints::kUnits));
+      points.channel[i][c] = static_cast<int32_t>(
+          std::lround(sums[i].channel[c] / sums[i].weight * ColorPoints::kUnits));
     }
   }
   return error;
@@ -149,12 +152,14 @@ Status FitPalette(const std::vector<ColorBin>& bins, int32_t colors, ColorPoints
   if (bins.empty()) return Status::Ok;
   std::vector<ColorBin> weighed = bins;  // as distances count
   for (ColorBin& bin : weighed) {
-    for (size_t c = 0; c < 3; ++c) bin.channel[c] *= std::sqrt(static_cast<float>(kChannelWeight[c]));
+    for (size_t c = 0; c < 3; ++c)
+      bin.channel[c] *= std::sqrt(static_cast<float>(kChannelWeight[c]));
   }
   for (const Point& mean : CutIntoGroups(weighed, static_cast<size_t>(colors))) {
     auto& point = points.channel[static_cast<size_t>(points.count++)];
     for (size_t c = 0; c < 3; ++c) {
-      point[c] = static_cast<int32_t>(std::lround(mean[c] / std::sqrt(kChannelWeight[c]) * ColorPoints::kUnits));
+      point[c] = static_cast<int32_t>(
+          std::lround(mean[c] / std::sqrt(kChannelWeight[c]) * ColorPoints::kUnits));
     }
   }
   NearestColor nearest;
@@ -180,8 +185,8 @@ void ColorMeans::Move(ColorPoints& points) const {
   for (size_t i = 0; i < static_cast<size_t>(points.count); ++i) {
     if (sums_[i].count == 0) continue;
     for (size_t c = 0; c < 3; ++c) {
-      points.channel[i][c] =
-          static_cast<int32_t>((sums_[i].channel[c] * ColorPoints::kUnits + sums_[i].count / 2) / sums_[i].count);
+      points.channel[i][c] = static_cast<int32_t>(
+          (sums_[i].channel[c] * ColorPoints::kUnits + sums_[i].count / 2) / sums_[i].count);
     }
   }
 }

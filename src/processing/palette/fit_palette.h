@@ -9,9 +9,10 @@
 
 namespace fotomill {
 
-// Finds at most `colors` (1 to 256) colors that stand for the bins with the least squared error: groups are cut in two
-// across their longest axis, the worst group first (Orchard and Bouman 1991), then all are moved to the middle of the
-// bins nearest to them, over and over (Lloyd 1982). MemoryAllocationError.
+// Finds at most `colors` (1 to 256) colors that stand for the bins with the least squared error:
+// groups are cut in two across their longest axis, the worst group first (Orchard and Bouman 1991),
+// then all are moved to the middle of the bins nearest to them, over and over (Lloyd 1982).
+// MemoryAllocationError.
 Status FitPalette(const std::vector<ColorBin>& bins, int32_t colors, ColorPoints& points);
 
 // Sums of the pixels that took each color.

@@ -21,13 +21,16 @@ namespace fotomill {
 namespace {
 
 constexpr int32_t kWhole = 100;              // per cent
-constexpr int kRefinements = 3;              // rounds in which the pixels themselves move the palette's colors
+// rounds in which the pixels themselves move the palette's colors
+constexpr int kRefinements = 3;
 constexpr int64_t kRefinedPixels = 200'000;  // about as many pixels take part
-constexpr int32_t kFewCells = 1024;          // a picture of fewer cells of colors has its colors counted one by one
+// a picture of fewer cells of colors has its colors counted one by one
+constexpr int32_t kFewCells = 1024;
 
-// Share of the quantization error that is diffused, in sixteenths. All of it preserves the mean of black and white. A palette
-// fitted to the picture does not reach its outermost colors, and errors that can never be compensated would grow into noise;
-// less is diffused there, the less the closer the colors are.
+// Share of the quantization error that is diffused, in sixteenths. All of it preserves the mean of
+// black and white. A palette fitted to the picture does not reach its outermost colors, and errors
+// that can never be compensated would grow into noise; less is diffused there, the less the closer
+// the colors are.
 constexpr int32_t kHandedOnMono = 16, kHandedOnFew = 12, kHandedOnMany = 10;
 constexpr int32_t kFew = 16;  // colors
 constexpr int32_t kRowsUnasked = 32;  // between two questions whether to go on
@@ -37,9 +40,12 @@ constexpr uint8_t Brightness(const uint8_t* bgr) {
   return static_cast<uint8_t>((29 * bgr[0] + 150 * bgr[1] + 77 * bgr[2] + 128) >> 8);
 }
 
-// Luma of the operations: rounded for dithers, rounded down for thresholds, which compares as the exact one does.
+// Luma of the operations: rounded for dithers, rounded down for thresholds, which compares as the
+// exact one does.
 uint8_t RoundedLuma(const uint8_t* bgr) { return Luma(bgr[2], bgr[1], bgr[0]); }
-uint8_t LumaBelow(const uint8_t* bgr) { return static_cast<uint8_t>(LumaThousandths(bgr[2], bgr[1], bgr[0]) / 1000); }
+uint8_t LumaBelow(const uint8_t* bgr) {
+  return static_cast<uint8_t>(LumaThousandths(bgr[2], bgr[1], bgr[0]) / 1000);
+}
 
 // The rows of a picture as they are to be reduced: 24 bits, adjusted, and gray where wanted.
 class SourceRows {
@@ -51,11 +57,12 @@ class SourceRows {
     adjusted_ = options.brightness != 0 || options.contrast != 0;
     for (int32_t i = 0; i < 256; ++i) {
       const int32_t spread = (2 * i - 255) * (kWhole + options.contrast) / (2 * kWhole);
-      levels_[static_cast<size_t>(i)] =
-          static_cast<uint8_t>(std::clamp(spread + 128 + options.brightness * 255 / kWhole, 0, 255));
+      levels_[static_cast<size_t>(i)] = static_cast<uint8_t>(
+          std::clamp(spread + 128 + options.brightness * 255 / kWhole, 0, 255));
     }
     if (!adjusted_ && !grays_) return Status::Ok;
-    return row_.Allocate(3 * static_cast<uint64_t>(width_)) ? Status::Ok : Status::MemoryAllocationError;
+    return row_.Allocate(3 * static_cast<uint64_t>(width_)) ? Status::Ok
+                                                            : Status::MemoryAllocationError;
   }
 
   const uint8_t* Row(int32_t y) {
@@ -64,14 +71,16 @@ class SourceRows {
     uint8_t* row = row_.Data();
     const size_t bytes = 3 * static_cast<size_t>(width_);
     for (size_t i = 0; i < bytes; ++i) row[i] = adjusted_ ? levels_[source[i]] : source[i];
-    for (size_t i = 0; grays_ && i < bytes; i += 3) row[i] = row[i + 1] = row[i + 2] = Brightness(row + i);
+    for (size_t i = 0; grays_ && i < bytes; i += 3)
+      row[i] = row[i + 1] = row[i + 2] = Brightness(row + i);
     return row;
   }
 
   template <uint8_t (*brightnessOf)(const uint8_t* bgr) = Brightness>
   void BrightnessRow(int32_t y, uint8_t* brightness) {
     const uint8_t* row = Row(y);
-    for (int32_t x = 0; x < width_; ++x) brightness[x] = brightnessOf(row + 3 * static_cast<size_t>(x));
+    for (int32_t x = 0; x < width_; ++x)
+      brightness[x] = brightnessOf(row + 3 * static_cast<size_t>(x));
   }
 
  private:
@@ -105,7 +114,8 @@ int32_t BestThreshold(const std::array<uint64_t, 256>& counts) {
   return threshold;
 }
 
-// The usual distance between a color and the one nearest to it, which an ordered pattern has to bridge.
+// The usual distance between a color and the one nearest to it, which an ordered pattern has to
+// bridge.
 int32_t PaletteSpacing(const Palette& palette, int32_t count) {
   double sum = 0;
   for (int32_t i = 0; i < count; ++i) {
@@ -113,7 +123,8 @@ int32_t PaletteSpacing(const Palette& palette, int32_t count) {
     for (int32_t j = 0; j < count; ++j) {
       int32_t distance = 0;
       for (int32_t c = 0; c < 3; ++c) {
-        const int32_t d = palette[static_cast<size_t>(3 * i + c)] - palette[static_cast<size_t>(3 * j + c)];
+        const int32_t d =
+            palette[static_cast<size_t>(3 * i + c)] - palette[static_cast<size_t>(3 * j + c)];
         distance += d * d;
       }
       if (j != i) least = std::min(least, distance);
@@ -131,7 +142,8 @@ int32_t ChannelSpacing(const Palette& palette, int32_t count) {
     for (int32_t j = 0; j < count; ++j) {
       int32_t distance = 0;
       for (int32_t c = 0; c < 3; ++c) {
-        distance = std::max(distance, std::abs(palette[static_cast<size_t>(3 * i + c)] - palette[static_cast<size_t>(3 * j + c)]));
+        distance = std::max(distance, std::abs(palette[static_cast<size_t>(3 * i + c)] -
+                                               palette[static_cast<size_t>(3 * j + c)]));
       }
       if (j != i) least = std::min(least, distance);
     }
@@ -175,12 +187,14 @@ struct Reduction {
   Status StoreRow(int32_t y) {
     PackIndices(indices.Data(), Width(), bits, made.Row(y).data());
     RETURN_IF_BAD(picture.ReportRow(y + 1));
-    return work != nullptr && y % kRowsUnasked == 0 && !work->GoesOn() ? Status::FunctionCancelled : Status::Ok;
+    return work != nullptr && y % kRowsUnasked == 0 && !work->GoesOn() ? Status::FunctionCancelled
+                                                                       : Status::Ok;
   }
   Status OpenRows() {
     RETURN_IF_BAD(source.Open(picture.image, options));
     const auto width = static_cast<uint64_t>(Width());
-    return indices.Allocate(width, platform::Fill::Unset) ? Status::Ok : Status::MemoryAllocationError;
+    return indices.Allocate(width, platform::Fill::Unset) ? Status::Ok
+                                                          : Status::MemoryAllocationError;
   }
   void Finish() {
     picture.image = std::move(made);
@@ -196,11 +210,13 @@ Status DitherToMono(Reduction& work, const BrightnessRows& brightnessRow) {
   const int32_t width = work.Width(), height = work.Height();
   const Dither dither = work.options.monoDither;
   platform::MemoryBlock gray;
-  if (!gray.Allocate(static_cast<uint64_t>(width), platform::Fill::Unset)) return Status::MemoryAllocationError;
+  if (!gray.Allocate(static_cast<uint64_t>(width), platform::Fill::Unset))
+    return Status::MemoryAllocationError;
   ErrorDiffuser diffuser;
   RETURN_IF_BAD(diffuser.Open(width, work.options.serpentine, kHandedOnMono));
   WideDiffuser wide;
-  if (IsWideDiffusion(dither)) RETURN_IF_BAD(wide.Open(dither, width, work.options.serpentine, kHandedOnMono));
+  if (IsWideDiffusion(dither))
+    RETURN_IF_BAD(wide.Open(dither, width, work.options.serpentine, kHandedOnMono));
   int32_t threshold = work.options.threshold;
   if (dither == Dither::None && threshold == 0) {
     std::array<uint64_t, 256> counts{};
@@ -269,8 +285,12 @@ Status ChoosePalette(Reduction& work, const PaletteChoice& choice, NearestColor&
   RETURN_IF_BAD(nearest.Open(true));
   ColorPoints points;
   switch (choice.kind) {
-    case PaletteChoice::Kind::Fitted: RETURN_IF_BAD(FitToPicture(work, choice.colors, nearest, points)); break;
-    case PaletteChoice::Kind::Grays: points = PointsOf(EvenGrays(choice.colors), choice.colors); break;
+    case PaletteChoice::Kind::Fitted:
+      RETURN_IF_BAD(FitToPicture(work, choice.colors, nearest, points));
+      break;
+    case PaletteChoice::Kind::Grays:
+      points = PointsOf(EvenGrays(choice.colors), choice.colors);
+      break;
     case PaletteChoice::Kind::Given: points = PointsOf(choice.given, choice.colors); break;
   }
   work.palette = PaletteOf(points);
@@ -284,8 +304,10 @@ Status DitherToPalette(Reduction& work, NearestColor& nearest) {
   ErrorDiffuser diffuser;
   RETURN_IF_BAD(diffuser.Open(work.Width(), work.options.serpentine, work.handedOn));
   WideDiffuser wide;
-  if (IsWideDiffusion(dither)) RETURN_IF_BAD(wide.Open(dither, work.Width(), work.options.serpentine, work.handedOn));
-  const int32_t spacing = work.even ? ChannelSpacing(work.palette, work.colors) : PaletteSpacing(work.palette, work.colors);
+  if (IsWideDiffusion(dither))
+    RETURN_IF_BAD(wide.Open(dither, work.Width(), work.options.serpentine, work.handedOn));
+  const int32_t spacing = work.even ? ChannelSpacing(work.palette, work.colors)
+                                    : PaletteSpacing(work.palette, work.colors);
   for (int32_t y = 0; y < work.Height(); ++y) {
     const uint8_t* row = work.source.Row(y);
     uint8_t* const indices = work.indices.Data();
@@ -350,8 +372,9 @@ Status ReduceColors(PictureRecord& picture, int32_t maxBits, const ReduceOptions
   } else {
     const int32_t most = 1 << bits;
     const bool fewer = options.grays && options.grayLevels != 0;
-    const PaletteChoice choice{.kind = options.grays ? PaletteChoice::Kind::Grays : PaletteChoice::Kind::Fitted,
-                               .colors = fewer ? std::min(most, options.grayLevels) : most};
+    const PaletteChoice choice{
+        .kind = options.grays ? PaletteChoice::Kind::Grays : PaletteChoice::Kind::Fitted,
+        .colors = fewer ? std::min(most, options.grayLevels) : most};
     RETURN_IF_BAD(ChoosePalette(work, choice, nearest));
     work.handedOn = HandedOn(work.colors);
   }
@@ -362,9 +385,11 @@ Status ReduceColors(PictureRecord& picture, int32_t maxBits, const ReduceOptions
   return Status::Ok;
 }
 
-Status ReduceToPalette(PictureRecord& picture, const PaletteChoice& choice, const ReduceOptions& options, const Work& goingOn) {
+Status ReduceToPalette(PictureRecord& picture, const PaletteChoice& choice,
+                       const ReduceOptions& options, const Work& goingOn) {
   if (picture.image.Empty()) return Status::EmptyImage;
-  const bool fitted = choice.kind == PaletteChoice::Kind::Fitted, adjusted = options.brightness != 0 || options.contrast != 0;
+  const bool fitted = choice.kind == PaletteChoice::Kind::Fitted,
+             adjusted = options.brightness != 0 || options.contrast != 0;
   bool kept = false;
   if (fitted && !adjusted) RETURN_IF_BAD(KeepFewColors(picture, choice.colors, kept));
   if (kept) return Status::Ok;
@@ -398,7 +423,8 @@ Status ReduceToMono(PictureRecord& picture, const ReduceOptions& options, const 
   RETURN_IF_BAD(NewPackedImage(work.Width(), work.Height(), &work.palette, 1, work.made));
   const bool cut = options.monoDither == Dither::None;
   RETURN_IF_BAD(DitherToMono(work, [&](int32_t y, uint8_t* row) {
-    cut ? work.source.BrightnessRow<LumaBelow>(y, row) : work.source.BrightnessRow<RoundedLuma>(y, row);
+    cut ? work.source.BrightnessRow<LumaBelow>(y, row)
+        : work.source.BrightnessRow<RoundedLuma>(y, row);
   }));
   work.Finish();
   return Status::Ok;

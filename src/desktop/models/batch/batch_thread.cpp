@@ -24,7 +24,9 @@ RgbImage SmallCopy(const PictureRecord& picture, int32_t side, Color matte) {
   PackedImage scaled, alpha;
   RgbImage rgb;
   const Size size = FitSize(picture.image.Width(), picture.image.Height(), side);
-  if (ScaleFiltered(picture.image, picture.alpha, size, ScaleFilter::Bilinear, scaled, alpha) != Status::Ok) return rgb;
+  if (ScaleFiltered(picture.image, picture.alpha, size, ScaleFilter::Bilinear, scaled, alpha) !=
+      Status::Ok)
+    return rgb;
   PictureRecord small;
   small.width = scaled.Width();
   small.height = scaled.Height();
@@ -37,19 +39,24 @@ RgbImage SmallCopy(const PictureRecord& picture, int32_t side, Color matte) {
 
 }  // namespace
 
-OverwritePreview MakeOverwritePreview(const OverwriteQuestion& question, int32_t side, const ThumbnailOptions& options) {
+OverwritePreview MakeOverwritePreview(const OverwriteQuestion& question, int32_t side,
+                                      const ThumbnailOptions& options) {
   OverwritePreview preview;
   const platform::FileFacts there = platform::FactsOf(question.path);
-  const ThumbnailPointer existing = LoadThumbnail({question.path, there.modified, there.size, side, choice::kVirtual, false, options});
+  const ThumbnailPointer existing = LoadThumbnail(
+      {question.path, there.modified, there.size, side, choice::kVirtual, false, options});
   preview.existing = existing->pixels;
-  preview.existingText = SizeText(there.size, choice::kSizeFitting) + "\n" + DateText(there.modified);
+  preview.existingText =
+      SizeText(there.size, choice::kSizeFitting) + "\n" + DateText(there.modified);
   if (existing->width > 0)
-    preview.existingText.append("\n").append(DimensionsText(existing->width, existing->height, existing->bits));
+    preview.existingText.append("\n").append(
+        DimensionsText(existing->width, existing->height, existing->bits));
   if (question.picture == nullptr) return preview;
   const PictureRecord& incoming = *question.picture;
   if (!incoming.image.Empty()) preview.incoming = SmallCopy(incoming, side, options.matte);
   const platform::FileFacts source = platform::FactsOf(question.source);
-  preview.incomingText.append(Tr("From %1", SizeText(source.size, choice::kSizeFitting))).append("\n");
+  preview.incomingText.append(Tr("From %1", SizeText(source.size, choice::kSizeFitting)))
+      .append("\n");
   preview.incomingText.append(DateText(source.modified)).append("\n");
   preview.incomingText += DimensionsText(incoming.width, incoming.height, incoming.bitsPerPixel);
   return preview;
@@ -64,15 +71,17 @@ class BatchThread::Box : public ProgressBox {
     return true;
   }
   void ShowLine(const ProgressLine& line, const FileOutcome* outcome) override {
-    batch_.PostToWindows([&windows = batch_.windows_, line, copy = outcome == nullptr ? FileOutcome() : *outcome] {
-      windows.BatchLine(line, copy);
-    });
+    batch_.PostToWindows(
+        [&windows = batch_.windows_, line, copy = outcome == nullptr ? FileOutcome() : *outcome] {
+          windows.BatchLine(line, copy);
+        });
   }
   void ShowStatus(const std::string& status) override {
     batch_.PostToWindows([&windows = batch_.windows_, status] { windows.BatchStatus(status); });
   }
   void ShowProgress(uint32_t done, uint32_t count) override {
-    batch_.PostToWindows([&windows = batch_.windows_, done, count] { windows.BatchProgress(done, count); });
+    batch_.PostToWindows(
+        [&windows = batch_.windows_, done, count] { windows.BatchProgress(done, count); });
   }
   void StayOpen(const ProgressModel& model) override {
     batch_.PostToWindows([&windows = batch_.windows_, model] { windows.BatchStaysOpen(model); });
@@ -88,12 +97,15 @@ class BatchThread::Box : public ProgressBox {
 // The batch's side of the prompts.
 class BatchThread::Questions : public Prompts {
  public:
-  Questions(BatchThread& batch, const ThumbnailOptions& thumbnails) : batch_(batch), thumbnails_(thumbnails) {}
+  Questions(BatchThread& batch, const ThumbnailOptions& thumbnails)
+      : batch_(batch), thumbnails_(thumbnails) {}
   OverwriteAnswer AskOverwrite(const OverwriteQuestion& question) override {
     OverwritePreview preview;
-    if (question.checks.previews) preview = MakeOverwritePreview(question, kPreviewSide, thumbnails_);
+    if (question.checks.previews)
+      preview = MakeOverwritePreview(question, kPreviewSide, thumbnails_);
     OverwriteAnswer answer;
-    answer.skipRest = !batch_.AskWindow([&] { answer = batch_.windows_.AskOverwrite(question, preview); });
+    answer.skipRest =
+        !batch_.AskWindow([&] { answer = batch_.windows_.AskOverwrite(question, preview); });
     return answer;
   }
   std::optional<std::string> AskDestinationName(const NameQuestion& question) override {
@@ -137,18 +149,20 @@ BatchThread::~BatchThread() {
 }
 
 void BatchThread::Start(std::vector<BatchFile> files, BatchFunction function, BatchJob job) {
-  StartWork(std::move(job), [files = std::move(files), function = std::move(function)](BatchJob& running) {
-    return RunBatch(files, function, running);
-  });
+  StartWork(std::move(job), [files = std::move(files), function = std::move(function)](
+                                BatchJob& running) { return RunBatch(files, function, running); });
 }
 
 void BatchThread::StartWork(BatchJob job, Work work) {
   task_.Wait();
   job_ = std::move(job);
   // The settings belong to the window's thread.
-  job_.remember = [this](Remembered what, int32_t value) { PostToWindows([what, value] { StoreRemembered(what, value); }); };
+  job_.remember = [this](Remembered what, int32_t value) {
+    PostToWindows([what, value] { StoreRemembered(what, value); });
+  };
   running_ = true;
-  const auto run = [this, work = std::move(work), thumbnails = ThumbnailOptionsFromSettings()](const StopToken&) {
+  const auto run = [this, work = std::move(work),
+                    thumbnails = ThumbnailOptionsFromSettings()](const StopToken&) {
     Box box(*this);
     Questions questions(*this, thumbnails);
     job_.box = &box;

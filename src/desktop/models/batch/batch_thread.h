@@ -39,7 +39,8 @@ class BatchWindows {
   virtual void BatchStaysOpen(const ProgressModel& model) = 0;
   virtual void BatchCloses() = 0;
   // The name of an output is taken. The batch waits for the answer.
-  virtual OverwriteAnswer AskOverwrite(const OverwriteQuestion& question, const OverwritePreview& preview) = 0;
+  virtual OverwriteAnswer AskOverwrite(const OverwriteQuestion& question,
+                                       const OverwritePreview& preview) = 0;
   // `nullopt`: the file is skipped.
   virtual std::optional<std::string> AskDestinationName(const NameQuestion& question) = 0;
   virtual std::optional<std::string> AskPassword(const std::string& path) = 0;  // nullopt: Cancel
@@ -50,15 +51,17 @@ class BatchWindows {
   virtual void BatchEnded(Status status, const BatchJob& job) = 0;
 };
 
-// Runs one batch apart; its reports and questions go to the windows by `post`, which has to run what it is
-// given on the window's thread, in order. A question holds the batch until it is answered.
+// Runs one batch apart; its reports and questions go to the windows by `post`, which has to run
+// what it is given on the window's thread, in order. A question holds the batch until it is
+// answered.
 class BatchThread {
  public:
   using Post = std::function<void(std::function<void()>)>;
 
   // The windows must outlive it.
   BatchThread(BatchWindows& windows, Post post) : windows_(windows), post_(std::move(post)) {}
-  // Asks a running batch to stop, answers its questions with no, and waits for it. `post` must not be waiting for this.
+  // Asks a running batch to stop, answers its questions with no, and waits for it. `post` must not
+  // be waiting for this.
   ~BatchThread();
   BatchThread(const BatchThread&) = delete;
   BatchThread& operator=(const BatchThread&) = delete;
@@ -66,7 +69,8 @@ class BatchThread {
   // Begins RunBatch with these; to be called when nothing runs. `job.box` and `job.prompts` are set
   // here.
   void Start(std::vector<BatchFile> files, BatchFunction function, BatchJob job);
-  // Any other work that reports to a box: `work` gets the job, with box and prompts set, and returns its status.
+  // Any other work that reports to a box: `work` gets the job, with box and prompts set, and
+  // returns its status.
   using Work = std::function<Status(BatchJob& job)>;
   void StartWork(BatchJob job, Work work);
   // Asks the batch to stop; it finishes what is in work.
@@ -90,7 +94,9 @@ class BatchThread {
   BackgroundTask task_;   // last: it uses the rest
 };
 
-// What the overwrite prompt shows of the file that is there and of the new picture, which may be missing.
-OverwritePreview MakeOverwritePreview(const OverwriteQuestion& question, int32_t side, const ThumbnailOptions& options);
+// What the overwrite prompt shows of the file that is there and of the new picture, which may be
+// missing.
+OverwritePreview MakeOverwritePreview(const OverwriteQuestion& question, int32_t side,
+                                      const ThumbnailOptions& options);
 
 }  // namespace fotomill::desktop

@@ -27,10 +27,12 @@ std::vector<DestinationFormat> DestinationFormats() {
   std::vector<DestinationFormat> formats;
   for (const int32_t row : DestinationRows()) {
     const FormatEntry& entry = FormatRow(row);
-    if (CanWrite(entry)) formats.push_back({LowerCase(entry.extension), std::string(entry.description), row});
+    if (CanWrite(entry))
+      formats.push_back({LowerCase(entry.extension), std::string(entry.description), row});
   }
   for (const PluginFormatFacts& format : PluginFormats()) {
-    if (format.canWrite) formats.push_back({LowerCase(format.extension), PluginDescription(format), kSpareRow});
+    if (format.canWrite)
+      formats.push_back({LowerCase(format.extension), PluginDescription(format), kSpareRow});
   }
   return formats;
 }
@@ -47,8 +49,10 @@ std::string DestinationProblem(const DestinationChoice& choice) {
   const int32_t row = RowOf(choice.extension);
   if (row == kNoFormat || !CanWrite(FormatRow(row))) return Tr("The format cannot be written.");
   if (choice.folder.empty()) return {};
-  if (choice.folder.size() > PathText::Capacity()) return Tr("The path of the folder is longer than 260 characters.");
-  if (platform::ExistenceOf(choice.folder) == platform::Existence::Yes && !platform::IsFolder(choice.folder))
+  if (choice.folder.size() > PathText::Capacity())
+    return Tr("The path of the folder is longer than 260 characters.");
+  if (platform::ExistenceOf(choice.folder) == platform::Existence::Yes &&
+      !platform::IsFolder(choice.folder))
     return Tr("\"%1\" is not a folder.", choice.folder);
   return {};
 }

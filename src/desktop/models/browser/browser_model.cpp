@@ -25,7 +25,9 @@ int CompareType(const FolderItem& a, const FolderItem& b) {
   return LowerCase(platform::ExtensionOf(a.name)).compare(LowerCase(platform::ExtensionOf(b.name)));
 }
 int CompareSize(const FolderItem& a, const FolderItem& b) { return Compare(a.size, b.size); }
-int CompareDate(const FolderItem& a, const FolderItem& b) { return Compare(a.modified, b.modified); }
+int CompareDate(const FolderItem& a, const FolderItem& b) {
+  return Compare(a.modified, b.modified);
+}
 int CompareTaken(const FolderItem& a, const FolderItem& b) { return Compare(a.taken, b.taken); }
 int CompareDimensions(const FolderItem& a, const FolderItem& b) {
   return Compare(int64_t{a.width} * a.height, int64_t{b.width} * b.height);
@@ -34,10 +36,12 @@ int CompareDimensions(const FolderItem& a, const FolderItem& b) {
 using Comparison = int (*)(const FolderItem& a, const FolderItem& b);
 
 // By choice::SortMode; equal ones, and all of kSortName, are in order of their names.
-constexpr Comparison kComparisons[] = {nullptr, CompareType, CompareSize, CompareDate, CompareTaken, CompareDimensions};
+constexpr Comparison kComparisons[] = {nullptr,     CompareType,  CompareSize,
+                                       CompareDate, CompareTaken, CompareDimensions};
 
 Comparison ComparisonOf(int32_t mode) {
-  return mode >= 0 && mode < static_cast<int32_t>(std::size(kComparisons)) ? kComparisons[mode] : nullptr;
+  return mode >= 0 && mode < static_cast<int32_t>(std::size(kComparisons)) ? kComparisons[mode]
+                                                                           : nullptr;
 }
 
 bool BeginsWith(std::string_view name, std::string_view typed) {
@@ -75,7 +79,8 @@ void BrowserModel::SetItems(std::vector<FolderItem> items) {
   for (size_t i = 0; i < items_.size(); ++i) old.emplace(items_[i].name, i);
 
   const std::vector<bool> oldSelected = SelectedItems();
-  const size_t oldFocus = ItemOrNone(selection_.Focus()), oldAnchor = ItemOrNone(selection_.Anchor());
+  const size_t oldFocus = ItemOrNone(selection_.Focus()),
+               oldAnchor = ItemOrNone(selection_.Anchor());
   const size_t focusLine = selection_.Focus();
   std::vector<bool> selected(items.size());
   size_t focus = kNoLine, anchor = kNoLine;
@@ -134,11 +139,13 @@ void BrowserModel::SortItems() {
 std::vector<bool> BrowserModel::SelectedItems() const {
   std::vector<bool> selected = hiddenSelected_;
   selected.resize(items_.size());
-  for (size_t line = 0; line < lines_.size(); ++line) selected[lines_[line]] = selection_.IsSelected(line);
+  for (size_t line = 0; line < lines_.size(); ++line)
+    selected[lines_[line]] = selection_.IsSelected(line);
   return selected;
 }
 
-void BrowserModel::BuildLines(const std::vector<bool>& selectedItems, size_t focusItem, size_t anchorItem) {
+void BrowserModel::BuildLines(const std::vector<bool>& selectedItems, size_t focusItem,
+                              size_t anchorItem) {
   lines_.clear();
   hiddenSelected_ = selectedItems;
   std::vector<bool> selected;
@@ -154,7 +161,9 @@ void BrowserModel::BuildLines(const std::vector<bool>& selectedItems, size_t foc
   selection_.Assign(std::move(selected), focus, anchor);
 }
 
-std::string BrowserModel::PathOfLine(size_t line) const { return platform::JoinFolder(folder_, Line(line).name); }
+std::string BrowserModel::PathOfLine(size_t line) const {
+  return platform::JoinFolder(folder_, Line(line).name);
+}
 
 size_t BrowserModel::FindLine(std::string_view name) const {
   for (size_t line = 0; line < lines_.size(); ++line) {
@@ -179,14 +188,16 @@ std::vector<std::string> BrowserModel::FilesForFunction() const {
     if (!Line(line).folder) files.push_back(PathOfLine(line));
   }
   const size_t focus = selection_.Focus();
-  if (selection_.SelectedCount() == 0 && focus != kNoLine && !Line(focus).folder) files.push_back(PathOfLine(focus));
+  if (selection_.SelectedCount() == 0 && focus != kNoLine && !Line(focus).folder)
+    files.push_back(PathOfLine(focus));
   return files;
 }
 
 std::vector<std::string> BrowserModel::PathsForFunction() const {
   std::vector<std::string> paths;
   for (const size_t line : selection_.SelectedLines()) paths.push_back(PathOfLine(line));
-  if (paths.empty() && selection_.Focus() != kNoLine) paths.push_back(PathOfLine(selection_.Focus()));
+  if (paths.empty() && selection_.Focus() != kNoLine)
+    paths.push_back(PathOfLine(selection_.Focus()));
   return paths;
 }
 
@@ -207,7 +218,8 @@ std::vector<std::string> BrowserModel::ShownFiles() const {
 void BrowserModel::SelectMatching(std::string_view pattern, MatchMode mode) {
   for (size_t line = 0; line < lines_.size(); ++line) {
     const bool matches = !pattern.empty() && MatchesFilter(Line(line).name, pattern);
-    if (matches || mode == MatchMode::Only) selection_.Set(line, matches && mode != MatchMode::Remove);
+    if (matches || mode == MatchMode::Only)
+      selection_.Set(line, matches && mode != MatchMode::Remove);
   }
 }
 
@@ -231,7 +243,8 @@ std::string BrowserModel::CountText() const {
   std::string text = TrCount("%1 file", "%1 files", files);
   if (folders > 0) text.append(", ").append(TrCount("%1 folder", "%1 folders", folders));
   if (lines_.size() < items_.size()) text = Tr("%1 of %2", text, ThousandsText(items_.size()));
-  if (selection_.SelectedCount() > 0) text.append(", ").append(Tr("%1 selected", ThousandsText(selection_.SelectedCount())));
+  if (selection_.SelectedCount() > 0)
+    text.append(", ").append(Tr("%1 selected", ThousandsText(selection_.SelectedCount())));
   if (files > 0) text.append(", ").append(SizeText(bytes, choice::kSizeFitting));
   return text;
 }
@@ -262,7 +275,8 @@ std::string SizeText(uint64_t bytes, int32_t mode) {
 std::string DateText(int64_t seconds) {
   const platform::LocalTime time = platform::LocalTimeOf(seconds);
   char text[64];
-  std::snprintf(text, sizeof text, "%04d-%02d-%02d %02d:%02d", time.year, time.month, time.day, time.hour, time.minute);
+  std::snprintf(text, sizeof text, "%04d-%02d-%02d %02d:%02d", time.year, time.month, time.day,
+                time.hour, time.minute);
   return text;
 }
 

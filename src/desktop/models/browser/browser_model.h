@@ -12,11 +12,12 @@
 
 namespace fotomill::desktop {
 
-// What becomes of the selection of lines whose names match a pattern: they alone are selected, they as well, or not any more.
+// What becomes of the selection of lines whose names match a pattern: they alone are selected, they
+// as well, or not any more.
 enum class MatchMode { Only, Add, Remove };
 
-// What one browser shows: the items of a folder in their order, those that pass the filter as lines, and the selection
-// among the lines. No window, no file access.
+// What one browser shows: the items of a folder in their order, those that pass the filter as
+// lines, and the selection among the lines. No window, no file access.
 class BrowserModel {
  public:
   // The folder, and how it is shown.
@@ -29,8 +30,9 @@ class BrowserModel {
 
   // Another folder, empty until its listing comes.
   void SetFolder(const std::string& folder);
-  // The folder's items; what was selected or focused stays so where an item of the name is still there. When the focused
-  // item has gone, the focus goes to the line that took its place. Facts that the new items lack are taken over.
+  // The folder's items; what was selected or focused stays so where an item of the name is still
+  // there. When the focused item has gone, the focus goes to the line that took its place. Facts
+  // that the new items lack are taken over.
   void SetItems(std::vector<FolderItem> items);
   // Facts that were found later; sorts anew only by UpdateOrder.
   void SetFacts(size_t item, const FolderItem& facts) { items_[item] = facts; }
@@ -50,7 +52,8 @@ class BrowserModel {
   std::string PathOfLine(size_t line) const;  // folder and name
   // The line of that name, kNoLine when it is not shown.
   size_t FindLine(std::string_view name) const;
-  // The next line whose name begins with `typed`, from the focus on: `typed` of one letter typed again continues to the next.
+  // The next line whose name begins with `typed`, from the focus on: `typed` of one letter typed
+  // again continues to the next.
   size_t FindTyped(std::string_view typed, bool next) const;
 
   // The selection of lines. Whoever changes it shows it.
@@ -61,7 +64,9 @@ class BrowserModel {
   // The same with folders.
   std::vector<std::string> PathsForFunction() const;
   // PathsForFunction would not be empty.
-  bool HasPathForFunction() const { return selection_.SelectedCount() > 0 || selection_.Focus() != kNoLine; }
+  bool HasPathForFunction() const {
+    return selection_.SelectedCount() > 0 || selection_.Focus() != kNoLine;
+  }
   bool HasFileForFunction() const;  // FilesForFunction would not be empty
   // All files that are shown, in list order.
   std::vector<std::string> ShownFiles() const;

@@ -17,7 +17,9 @@ void CellLayout::SetWindow(int32_t width, int32_t height) {
   columns_ = std::max((windowWidth_ - gap_) / (cellWidth_ + gap_), 1);
 }
 
-int64_t CellLayout::LargestScroll() const { return std::max<int64_t>(TotalHeight() - windowHeight_, 0); }
+int64_t CellLayout::LargestScroll() const {
+  return std::max<int64_t>(TotalHeight() - windowHeight_, 0);
+}
 
 Rect CellLayout::Cell(size_t line) const {
   const int64_t row = static_cast<int64_t>(line) / columns_;
@@ -33,8 +35,10 @@ Rect CellLayout::Cell(size_t line) const {
 
 size_t CellLayout::LineAt(int32_t x, int64_t y) const {
   if (y < gap_) return kNoLine;
-  const size_t first = static_cast<size_t>((y - gap_) / RowHeight()) * static_cast<size_t>(columns_);
-  for (size_t line = first; line < std::min(first + static_cast<size_t>(columns_), count_); ++line) {
+  const size_t first =
+      static_cast<size_t>((y - gap_) / RowHeight()) * static_cast<size_t>(columns_);
+  for (size_t line = first; line < std::min(first + static_cast<size_t>(columns_), count_);
+       ++line) {
     if (Cell(line).Contains(x, static_cast<int32_t>(y))) return line;
   }
   return kNoLine;
@@ -43,7 +47,9 @@ size_t CellLayout::LineAt(int32_t x, int64_t y) const {
 CellLayout::Range CellLayout::LinesBetween(int64_t top, int64_t bottom) const {
   const int64_t firstRow = std::max<int64_t>(top - gap_, 0) / RowHeight();
   const int64_t endRow = std::max<int64_t>(bottom - gap_ + RowHeight() - 1, 0) / RowHeight();
-  const auto line = [&](int64_t row) { return std::min(static_cast<size_t>(row * columns_), count_); };
+  const auto line = [&](int64_t row) {
+    return std::min(static_cast<size_t>(row * columns_), count_);
+  };
   return {line(firstRow), std::max(line(endRow), line(firstRow))};
 }
 
@@ -52,8 +58,8 @@ std::vector<size_t> CellLayout::LinesIn(const Rect& band) const {
   const Range rows = LinesBetween(band.y, int64_t{band.y} + band.height);
   for (size_t line = rows.first; line < rows.end; ++line) {
     const Rect cell = Cell(line);
-    const bool apart = cell.x >= band.x + band.width || cell.x + cell.width <= band.x || cell.y >= band.y + band.height ||
-                       cell.y + cell.height <= band.y;
+    const bool apart = cell.x >= band.x + band.width || cell.x + cell.width <= band.x ||
+                       cell.y >= band.y + band.height || cell.y + cell.height <= band.y;
     if (!apart) lines.push_back(line);
   }
   return lines;
@@ -65,7 +71,8 @@ size_t CellLayout::Move(size_t line, Step step) const {
   const int64_t last = static_cast<int64_t>(count_) - 1;
   const int64_t page = int64_t{std::max(windowHeight_ / RowHeight(), 1)} * columns_;
   const int64_t from = static_cast<int64_t>(line);
-  // A step over rows keeps the column; where there is no cell in it, up stays, and down goes to the last one.
+  // A step over rows keeps the column; where there is no cell in it, up stays, and down goes to the
+  // last one.
   const auto rows = [&](int64_t distance) {
     if (from + distance < 0) return distance == -columns_ ? from : from % columns_;
     if (from + distance <= last) return from + distance;
@@ -88,7 +95,8 @@ int64_t CellLayout::ScrollToShow(size_t line, int64_t scroll) const {
   const Rect cell = Cell(line);
   if (cell.y - gap_ < scroll) return std::clamp<int64_t>(cell.y - gap_, 0, LargestScroll());
   const int64_t bottom = int64_t{cell.y} + cell.height + gap_;
-  if (bottom > scroll + windowHeight_) return std::clamp<int64_t>(bottom - windowHeight_, 0, LargestScroll());
+  if (bottom > scroll + windowHeight_)
+    return std::clamp<int64_t>(bottom - windowHeight_, 0, LargestScroll());
   return std::clamp<int64_t>(scroll, 0, LargestScroll());
 }
 

@@ -13,15 +13,18 @@ struct Rect {
   int32_t x = 0, y = 0, width = 0, height = 0;
 
   // A point on the right or bottom edge is outside.
-  bool Contains(int32_t px, int32_t py) const { return px >= x && py >= y && px < x + width && py < y + height; }
+  bool Contains(int32_t px, int32_t py) const {
+    return px >= x && py >= y && px < x + width && py < y + height;
+  }
   bool operator==(const Rect&) const = default;
 };
 
 // Where a key takes the focus.
 enum class Step { Left, Right, Up, Down, PageUp, PageDown, First, Last };
 
-// Where the cells of a thumbnail list lie: rows of equal cells, as many to a row as fit, in a window that scrolls
-// downward. All in pixels of the window; y of cells counts from the list's top, whatever is scrolled.
+// Where the cells of a thumbnail list lie: rows of equal cells, as many to a row as fit, in a
+// window that scrolls downward. All in pixels of the window; y of cells counts from the list's top,
+// whatever is scrolled.
 class CellLayout {
  public:
   // Cells of that size, `spread` apart at least; a row's spare width is shared out between them.
@@ -42,11 +45,13 @@ class CellLayout {
   Rect Cell(size_t line) const;
   // The line whose cell is at a point of the list, kNoLine between cells.
   size_t LineAt(int32_t x, int64_t y) const;
-  // Lines from the first up to and without the last that a window scrolled by `scroll` shows, in part at least.
+  // Lines from the first up to and without the last that a window scrolled by `scroll` shows, in
+  // part at least.
   struct Range {
     size_t first = 0, end = 0;
   };
-  Range Visible(int64_t scroll) const { return LinesBetween(scroll, scroll + windowHeight_); }  // rows in part included
+  // rows in part included
+  Range Visible(int64_t scroll) const { return LinesBetween(scroll, scroll + windowHeight_); }
   // Lines whose rows touch the band between two heights.
   Range LinesBetween(int64_t top, int64_t bottom) const;
   // Lines whose cells touch a rectangle of the list: the rubber band.

@@ -17,25 +17,34 @@ namespace {
 constexpr int32_t kNarrowest = 20, kWidest = 4000;
 
 std::string NameText(const FolderItem& item) { return item.name; }
-std::string TypeText(const FolderItem& item) { return item.folder ? std::string(Tr("Folder")) : DescribeFileType(item.name); }
+std::string TypeText(const FolderItem& item) {
+  return item.folder ? std::string(Tr("Folder")) : DescribeFileType(item.name);
+}
 std::string SizeColumnText(const FolderItem& item) {
   return item.folder ? std::string() : SizeText(item.size, settings.DetailSizeMode);
 }
-std::string ModifiedText(const FolderItem& item) { return item.modified == 0 ? std::string() : DateText(item.modified); }
+std::string ModifiedText(const FolderItem& item) {
+  return item.modified == 0 ? std::string() : DateText(item.modified);
+}
 std::string DimensionsText(const FolderItem& item) {
-  return item.width == 0 ? std::string() : std::to_string(item.width) + " x " + std::to_string(item.height);
+  return item.width == 0 ? std::string()
+                         : std::to_string(item.width) + " x " + std::to_string(item.height);
 }
 std::string DepthText(const FolderItem& item) {
-  return item.bits == 0 ? std::string() : TrCount("%1 bit", "%1 bits", static_cast<uint64_t>(item.bits));
+  return item.bits == 0 ? std::string()
+                        : TrCount("%1 bit", "%1 bits", static_cast<uint64_t>(item.bits));
 }
 
 // 20040831223208 as "2004-08-31 22:32".
 std::string TakenText(const FolderItem& item) {
   if (item.taken <= 0) return {};
-  const auto part = [&](int64_t unit, int64_t size) { return static_cast<long long>(item.taken / unit % size); };
+  const auto part = [&](int64_t unit, int64_t size) {
+    return static_cast<long long>(item.taken / unit % size);
+  };
   char text[64];
-  std::snprintf(text, sizeof text, "%04lld-%02lld-%02lld %02lld:%02lld", part(10'000'000'000, 10'000), part(100'000'000, 100),
-                part(1'000'000, 100), part(10'000, 100), part(100, 100));
+  std::snprintf(text, sizeof text, "%04lld-%02lld-%02lld %02lld:%02lld",
+                part(10'000'000'000, 10'000), part(100'000'000, 100), part(1'000'000, 100),
+                part(10'000, 100), part(100, 100));
   return text;
 }
 
@@ -83,8 +92,8 @@ DetailColumns ParseDetailColumns(std::string_view text) {
 std::string DetailColumnsText(const DetailColumns& columns) {
   std::string text;
   for (const DetailColumn& column : columns) {
-    text += std::string(text.empty() ? "" : ",") + (column.shown ? "" : "-") + kDetails[column.detail].title + ":" +
-            std::to_string(column.width);
+    text += std::string(text.empty() ? "" : ",") + (column.shown ? "" : "-") +
+            kDetails[column.detail].title + ":" + std::to_string(column.width);
   }
   return text;
 }

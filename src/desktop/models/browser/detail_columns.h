@@ -32,8 +32,8 @@ struct DetailColumn {
 };
 using DetailColumns = std::vector<DetailColumn>;  // from left to right, every detail once
 
-// "Name:260,Size:110,-Depth:70", hidden ones behind a "-", and back. What the text lacks comes last, as it is without a text;
-// what is not understood is passed over.
+// "Name:260,Size:110,-Depth:70", hidden ones behind a "-", and back. What the text lacks comes
+// last, as it is without a text; what is not understood is passed over.
 DetailColumns ParseDetailColumns(std::string_view text);
 std::string DetailColumnsText(const DetailColumns& columns);
 

@@ -29,22 +29,27 @@ std::string Beginning(std::string_view text) {
 // The lines that need the file's header.
 void AddHeaderLines(const std::string& path, Status known, std::vector<std::string>& lines) {
   PicturePointer picture;
-  const Status status = LoadPictureInfo({.fileName = path, .options = ReadOptionsFromSettings()}, picture);
+  const Status status =
+      LoadPictureInfo({.fileName = path, .options = ReadOptionsFromSettings()}, picture);
   const Status problem = status != Status::Ok ? status : known;
   if (problem != Status::Ok) lines.push_back(Tr(StatusMessage(problem)));
   if (status != Status::Ok) return;
-  std::string facts = Tr("%1 x %2 pixels, %3 bits", picture->width, picture->height, picture->bitsPerPixel);
+  std::string facts =
+      Tr("%1 x %2 pixels, %3 bits", picture->width, picture->height, picture->bitsPerPixel);
   if (picture->pageCount > 1) {
-    facts.append(", ").append(TrCount("%1 page", "%1 pages", static_cast<uint64_t>(picture->pageCount)));
+    facts.append(", ").append(
+        TrCount("%1 page", "%1 pages", static_cast<uint64_t>(picture->pageCount)));
   }
   lines.push_back(std::move(facts));
-  std::string comment = Beginning({reinterpret_cast<const char*>(picture->comment.data()), picture->comment.size()});
+  std::string comment =
+      Beginning({reinterpret_cast<const char*>(picture->comment.data()), picture->comment.size()});
   if (!comment.empty()) lines.push_back(std::move(comment));
 }
 
 }  // namespace
 
-std::vector<std::string> FileTipLines(const std::string& folder, const FolderItem& item, Status known) {
+std::vector<std::string> FileTipLines(const std::string& folder, const FolderItem& item,
+                                      Status known) {
   std::vector<std::string> lines{item.name};
   if (item.folder) {
     if (item.modified != 0) lines.push_back(DateText(item.modified));

@@ -22,7 +22,8 @@ class FormatFinder {
   int32_t Find(std::string_view name) {
     const std::string extension(platform::ExtensionOf(name));
     const auto [found, added] = rows_.try_emplace(extension, kNoFormat);
-    if (added && !extension.empty() && !EqualIgnoringCase(extension, "THN")) found->second = FindFormatByName(name);
+    if (added && !extension.empty() && !EqualIgnoringCase(extension, "THN"))
+      found->second = FindFormatByName(name);
     return found->second;
   }
 
@@ -70,10 +71,13 @@ FolderListing ListForBrowser(const std::string& folder, bool facts, const StopTo
 
 std::vector<std::string> SubfolderNames(const std::string& folder) {
   std::vector<std::string> names;
-  for (const platform::FolderEntry& entry : platform::ListFolder(folder).value_or(std::vector<platform::FolderEntry>())) {
-    if (entry.kind == platform::FileKind::Folder && !entry.name.starts_with('.')) names.push_back(entry.name);
+  for (const platform::FolderEntry& entry :
+       platform::ListFolder(folder).value_or(std::vector<platform::FolderEntry>())) {
+    if (entry.kind == platform::FileKind::Folder && !entry.name.starts_with('.'))
+      names.push_back(entry.name);
   }
-  std::sort(names.begin(), names.end(), [](const auto& a, const auto& b) { return CompareNatural(a, b) < 0; });
+  std::sort(names.begin(), names.end(),
+            [](const auto& a, const auto& b) { return CompareNatural(a, b) < 0; });
   return names;
 }
 
@@ -89,13 +93,16 @@ void AddFacts(const std::string& folder, FolderListing& listing, const StopToken
 void AddPictureFacts(const std::string& folder, FolderItem& item) {
   const std::string path = platform::JoinFolder(folder, item.name);
   PicturePointer picture;
-  if (LoadPictureInfo({.fileName = path, .options = ReadOptionsFromSettings()}, picture) != Status::Ok) return;
+  if (LoadPictureInfo({.fileName = path, .options = ReadOptionsFromSettings()}, picture) !=
+      Status::Ok)
+    return;
   item.width = picture->width;
   item.height = picture->height;
   item.bits = picture->bitsPerPixel;
   ExifSource exif;
   TakenDate date;
-  if (exif.Open(path.c_str()) == Status::Ok && WalkExif(exif.Block(), &date)) item.taken = date.number;
+  if (exif.Open(path.c_str()) == Status::Ok && WalkExif(exif.Block(), &date))
+    item.taken = date.number;
 }
 
 }  // namespace fotomill::desktop

@@ -16,7 +16,8 @@ struct FolderItem {
   uint64_t size = 0;
   int64_t modified = 0;                     // seconds since 1970-01-01 UTC
   int32_t width = 0, height = 0, bits = 0;  // 0 until somebody has read the file's header
-  int64_t taken = 0;                        // the EXIF date as a number that sorts, 0 without one or before somebody has read it
+  // the EXIF date as a number that sorts, 0 without one or before somebody has read it
+  int64_t taken = 0;
 
   bool operator==(const FolderItem&) const = default;
 };
@@ -27,8 +28,9 @@ struct FolderListing {
   std::vector<FolderItem> items;  // in no particular order
 };
 
-// What a browser shows of a folder: folders, and files of known formats, without hidden ones and thumbnail files. With
-// `facts` off, sizes and times stay 0, which is many times faster. Ends early, with what it has, when `stop` is asked.
+// What a browser shows of a folder: folders, and files of known formats, without hidden ones and
+// thumbnail files. With `facts` off, sizes and times stay 0, which is many times faster. Ends
+// early, with what it has, when `stop` is asked.
 FolderListing ListForBrowser(const std::string& folder, bool facts, const StopToken& stop);
 
 // The names of the folders in a folder, without hidden ones, in order.

@@ -18,7 +18,8 @@ constexpr const char* kFile = "FMWFolderViews.txt";
 constexpr size_t kMostFolders = 500;
 
 bool FitsLine(std::string_view folder) {
-  return !folder.empty() && folder.find_first_of(std::string_view("\n\r\0", 3)) == std::string_view::npos;
+  return !folder.empty() &&
+         folder.find_first_of(std::string_view("\n\r\0", 3)) == std::string_view::npos;
 }
 
 // A number up to `last` in front of a comma, taken off the line.
@@ -57,11 +58,12 @@ void FolderViews::Load() {
 
 bool FolderViews::Save() {
   if (unsaved_.empty()) return true;
-  const EditResult result = EditTextFile(DataFile(kFile), limits.listFileBytes, [this](std::string& text) {
-    FolderViews merged = Parse(text);
-    for (const Entry& entry : unsaved_) merged.Keep(entry.folder, entry.view);
-    text = merged.Text();
-  });
+  const EditResult result =
+      EditTextFile(DataFile(kFile), limits.listFileBytes, [this](std::string& text) {
+        FolderViews merged = Parse(text);
+        for (const Entry& entry : unsaved_) merged.Keep(entry.folder, entry.view);
+        text = merged.Text();
+      });
   if (result != EditResult::Done && result != EditResult::Unchanged) return false;
   unsaved_.clear();
   return true;
@@ -87,8 +89,8 @@ std::string FolderViews::Text() const {
   std::string text;
   for (const Entry& entry : entries_) {
     const FolderView& view = entry.view;
-    text += std::to_string(view.modes.view) + "," + std::to_string(view.modes.sort) + "," + (view.descending ? "1," : "0,") +
-            entry.folder + "\n";
+    text += std::to_string(view.modes.view) + "," + std::to_string(view.modes.sort) + "," +
+            (view.descending ? "1," : "0,") + entry.folder + "\n";
   }
   return text;
 }

@@ -18,8 +18,9 @@ struct FolderView {
   bool operator==(const FolderView&) const = default;
 };
 
-// How folders were last asked to be shown: order, direction and view mode, not where thumbnails come from. Kept in the data
-// folder in the file "FMWFolderViews.txt", a line "VIEW,SORT,DESCENDING,FOLDER" each, the latest first, 500 at most.
+// How folders were last asked to be shown: order, direction and view mode, not where thumbnails
+// come from. Kept in the data folder in the file "FMWFolderViews.txt", a line
+// "VIEW,SORT,DESCENDING,FOLDER" each, the latest first, 500 at most.
 class FolderViews {
  public:
   // `otherwise` with what is kept of a folder.
@@ -28,7 +29,8 @@ class FolderViews {
 
   // Takes up what the file holds; without one, nothing is kept of any folder.
   void Load();
-  // Merges what was kept since the last call into the file, which other processes change too. False when it cannot be written.
+  // Merges what was kept since the last call into the file, which other processes change too. False
+  // when it cannot be written.
   [[nodiscard]] bool Save();
 
   // The text of the file. Lines that are not understood are passed over.

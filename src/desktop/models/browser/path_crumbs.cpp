@@ -23,23 +23,27 @@ std::vector<Crumb> CrumbsOf(const std::string& folder) {
   return crumbs;
 }
 
-std::vector<std::string> Completions(const std::string& typed, const std::vector<std::string>& names) {
+std::vector<std::string> Completions(const std::string& typed,
+                                     const std::vector<std::string>& names) {
   const std::string folder(platform::SplitPath(typed).folder);
   const std::string_view begun = std::string_view(typed).substr(folder.size());
   std::vector<std::string> paths;
   if (begun.empty() || std::ranges::find(names, begun) != names.end()) return paths;
   for (const std::string& name : names) {
     // Other bytes cannot be in a field for text.
-    if (IsUtf8(name) && EqualIgnoringCase(std::string_view(name).substr(0, begun.size()), begun)) paths.push_back(folder + name);
+    if (IsUtf8(name) && EqualIgnoringCase(std::string_view(name).substr(0, begun.size()), begun))
+      paths.push_back(folder + name);
   }
-  std::stable_partition(paths.begin(), paths.end(), [&](const std::string& path) { return path.starts_with(typed); });
+  std::stable_partition(paths.begin(), paths.end(),
+                        [&](const std::string& path) { return path.starts_with(typed); });
   return paths;
 }
 
 size_t FirstCrumbShown(std::span<const int> widths, int room, int more) {
   if (std::accumulate(widths.begin(), widths.end(), 0) <= room) return 0;
   size_t first = widths.size();
-  for (int used = more; first > 0 && (first == widths.size() || used + widths[first - 1] <= room); --first)
+  for (int used = more; first > 0 && (first == widths.size() || used + widths[first - 1] <= room);
+       --first)
     used += widths[first - 1];
   return first;
 }

@@ -10,13 +10,14 @@ namespace fotomill::desktop {
 // Stands for no line.
 inline constexpr size_t kNoLine = static_cast<size_t>(-1);
 
-// What is selected among the lines of a list, which line has the focus, and from where a range extends: the rules that
-// mouse and keyboard follow in every file list. Lines are counted from 0.
+// What is selected among the lines of a list, which line has the focus, and from where a range
+// extends: the rules that mouse and keyboard follow in every file list. Lines are counted from 0.
 class Selection {
  public:
   // A list of `count` lines with nothing selected.
   void Reset(size_t count);
-  // The list anew: `selected` for each line, and where focus and anchor are now, kNoLine for nowhere.
+  // The list anew: `selected` for each line, and where focus and anchor are now, kNoLine for
+  // nowhere.
   void Assign(std::vector<bool> selected, size_t focus, size_t anchor);
 
   // How many lines there are and how many are selected; focus and anchor are kNoLine when they are
@@ -38,8 +39,8 @@ class Selection {
   void ClickBlank(bool clears) {
     if (clears) SelectNone();
   }
-  // The focus goes to a line by keyboard: alone it selects the line, with Shift the range from the anchor, with Ctrl
-  // it moves without selecting.
+  // The focus goes to a line by keyboard: alone it selects the line, with Shift the range from the
+  // anchor, with Ctrl it moves without selecting.
   void MoveFocus(size_t line, bool shift, bool control);
   void ToggleFocus();  // selects the focused line, or not any more; others stay
   void SelectOnly(size_t line);  // focus and anchor go there
@@ -48,7 +49,8 @@ class Selection {
   void Invert();  // selects what was not, and nothing else
   void Set(size_t line, bool selected);  // focus and anchor stay
 
-  // The rubber band: `inside` are the lines that it touches now; with `keep` they add to what was selected when it began.
+  // The rubber band: `inside` are the lines that it touches now; with `keep` they add to what was
+  // selected when it began.
   void BeginBand(bool keep);
   void MoveBand(std::span<const size_t> inside);
 

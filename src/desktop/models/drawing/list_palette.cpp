@@ -25,7 +25,9 @@ double Contrast(Shade a, Shade b) {
 }
 
 Shade Blend(Shade from, Shade to, double part) {
-  const auto mix = [part](int a, int b) { return static_cast<uint8_t>(std::lround(a + (b - a) * part)); };
+  const auto mix = [part](int a, int b) {
+    return static_cast<uint8_t>(std::lround(a + (b - a) * part));
+  };
   return {mix(from.red, to.red), mix(from.green, to.green), mix(from.blue, to.blue)};
 }
 

@@ -17,7 +17,8 @@ inline constexpr double kReadable = 4.5;
 
 // `part` of the way from one shade to the other.
 Shade Blend(Shade from, Shade to, double part);
-// The shade next to `wanted` that is readable on, or under, `other`: nearer to black or to white, whichever takes less.
+// The shade next to `wanted` that is readable on, or under, `other`: nearer to black or to white,
+// whichever takes less.
 Shade Readable(Shade wanted, Shade other);
 
 // The shades of a canvas that lists files. Every text is readable on what it is on.

@@ -49,7 +49,8 @@ RgbImage FilledImage(int32_t width, int32_t height, Color color) {
   RgbImage image;
   if (!Reserve(image, width, height)) return image;
   const size_t row = 3 * static_cast<size_t>(width);
-  for (size_t i = 0; i < std::min(row, image.bytes.size()); ++i) image.bytes[i] = static_cast<uint8_t>(color >> (8 * (i % 3)));
+  for (size_t i = 0; i < std::min(row, image.bytes.size()); ++i)
+    image.bytes[i] = static_cast<uint8_t>(color >> (8 * (i % 3)));
   for (int32_t y = 1; y < height; ++y) std::memcpy(image.Row(y), image.Row(0), row);
   return image;
 }
@@ -58,7 +59,8 @@ Status ToRgb(const PackedImage& image, RgbImage& rgb) {
   BgrRows rows;
   RETURN_IF_BAD(rows.Open(image));
   if (!Reserve(rgb, image.Width(), image.Height())) return Status::MemoryAllocationError;
-  for (int32_t y = 0; y < rgb.height; ++y) SwapColors(rows.Row(y), static_cast<size_t>(rgb.width), rgb.Row(y));
+  for (int32_t y = 0; y < rgb.height; ++y)
+    SwapColors(rows.Row(y), static_cast<size_t>(rgb.width), rgb.Row(y));
   return Status::Ok;
 }
 
@@ -67,7 +69,8 @@ Status ToRgb(const PackedImage& image, const PackedImage& alpha, Color backgroun
   for (int32_t y = 0; y < rgb.height && !alpha.Empty(); ++y) {
     uint8_t* pixel = rgb.Row(y);
     for (const uint8_t a : alpha.Row(y).first(static_cast<size_t>(rgb.width))) {
-      for (int shift = 0; shift < 24; shift += 8, ++pixel) *pixel = Blend(static_cast<uint8_t>(background >> shift), *pixel, a);
+      for (int shift = 0; shift < 24; shift += 8, ++pixel)
+        *pixel = Blend(static_cast<uint8_t>(background >> shift), *pixel, a);
     }
   }
   return Status::Ok;
@@ -75,7 +78,8 @@ Status ToRgb(const PackedImage& image, const PackedImage& alpha, Color backgroun
 
 Status ToPacked(const RgbImage& rgb, PackedImage& image) {
   RETURN_IF_BAD(NewPackedImage(rgb.width, rgb.height, nullptr, 24, image));
-  for (int32_t y = 0; y < rgb.height; ++y) SwapColors(rgb.Row(y), static_cast<size_t>(rgb.width), image.Row(y).data());
+  for (int32_t y = 0; y < rgb.height; ++y)
+    SwapColors(rgb.Row(y), static_cast<size_t>(rgb.width), image.Row(y).data());
   return Status::Ok;
 }
 
@@ -96,11 +100,16 @@ Status PrepareWithAlpha(PictureRecord& picture) {
 }
 
 RgbImage WithoutMatte(const RgbImage& image, Color matte) {
-  const uint8_t color[3] = {static_cast<uint8_t>(matte), static_cast<uint8_t>(matte >> 8), static_cast<uint8_t>(matte >> 16)};
+  const uint8_t color[3] = {static_cast<uint8_t>(matte), static_cast<uint8_t>(matte >> 8),
+                            static_cast<uint8_t>(matte >> 16)};
   int32_t top = 0, left = 0;
   // The two sides of a margin differ by one pixel at most, since the picture is in the middle.
-  while (2 * (top + 1) < image.height && RowIs(image, top, color) && RowIs(image, image.height - 1 - top, color)) ++top;
-  while (2 * (left + 1) < image.width && ColumnIs(image, left, color) && ColumnIs(image, image.width - 1 - left, color)) ++left;
+  while (2 * (top + 1) < image.height && RowIs(image, top, color) &&
+         RowIs(image, image.height - 1 - top, color))
+    ++top;
+  while (2 * (left + 1) < image.width && ColumnIs(image, left, color) &&
+         ColumnIs(image, image.width - 1 - left, color))
+    ++left;
   RgbImage cut;
   if (!Reserve(cut, image.width - 2 * left, image.height - 2 * top)) return cut;
   for (int32_t y = 0; y < cut.height; ++y) {

@@ -6,7 +6,9 @@
 namespace fotomill::desktop {
 
 FileOperationOptions FileOperationOptionsFromSettings() {
-  return {.firstVariant = settings.NumberedVariantMin, .lastVariant = settings.NumberedVariantMax, .replacing = DropThumbnails};
+  return {.firstVariant = settings.NumberedVariantMin,
+          .lastVariant = settings.NumberedVariantMax,
+          .replacing = DropThumbnails};
 }
 
 }  // namespace fotomill::desktop

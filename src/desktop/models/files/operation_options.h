@@ -4,7 +4,8 @@
 
 namespace fotomill::desktop {
 
-// NumberedVariantMin and NumberedVariantMax, as they are now; thumbnails of files that are replaced go.
+// NumberedVariantMin and NumberedVariantMax, as they are now; thumbnails of files that are replaced
+// go.
 FileOperationOptions FileOperationOptionsFromSettings();
 
 }  // namespace fotomill::desktop

@@ -24,10 +24,14 @@ constexpr const char* kExtension = ".png";
 // The first path that is free; empty if there is none.
 std::string FreePath(const std::string& folder) {
   const std::string_view wanted = settings.ClipboardPictureName.view();
-  const std::string name(IsPlainName(wanted) && !wanted.empty() ? wanted : defaultSettings.ClipboardPictureName.view());
+  const std::string name(IsPlainName(wanted) && !wanted.empty()
+                             ? wanted
+                             : defaultSettings.ClipboardPictureName.view());
   std::string path = platform::JoinFolder(folder, name + kExtension);
   if (platform::ExistenceOf(path) == platform::Existence::No) return path;
-  return MakeNumberedVariant(path, 1, INT32_MAX, platform::ExistenceOf) == VariantSearch::Found ? path : std::string();
+  return MakeNumberedVariant(path, 1, INT32_MAX, platform::ExistenceOf) == VariantSearch::Found
+             ? path
+             : std::string();
 }
 
 Status ToRecord(const PastedPicture& pasted, PictureRecord& picture) {
@@ -37,7 +41,8 @@ Status ToRecord(const PastedPicture& pasted, PictureRecord& picture) {
   RETURN_IF_BAD(NewAlphaPlane(pasted.pixels.width, pasted.pixels.height, picture.alpha));
   for (int32_t y = 0; y < pasted.pixels.height; ++y) {
     const std::span<uint8_t> row = picture.alpha.Row(y);
-    std::copy_n(pasted.alpha.begin() + static_cast<std::ptrdiff_t>(static_cast<size_t>(y) * width), width, row.begin());
+    std::copy_n(pasted.alpha.begin() + static_cast<std::ptrdiff_t>(static_cast<size_t>(y) * width),
+                width, row.begin());
   }
   return Status::Ok;
 }

@@ -12,18 +12,23 @@ namespace fotomill::desktop {
 
 FileOperationResult TurnOneFile(const std::string& path, Orientation turn) {
   if (platform::FactsOf(path).link)
-    return {{FileOperationKind::Turn, {}}, {{path, Tr("This is a link; rotate the file it points to.")}}};
+    return {{FileOperationKind::Turn, {}},
+            {{path, Tr("This is a link; rotate the file it points to.")}}};
   PreviousFiles previous(DropThumbnails);
   WriteOptions options{.encode = EncodeOptionsFromSettings()};
   bool kept = true;
   options.makeWay = [&] { return kept = previous.Keep(path); };
   const TurnRequest request{.turn = turn, .seenByExif = settings.ExifAdjustOrientation != 0};
-  const TurnedFile turned = TurnPictureFile(path, path, request, ReadOptionsFromSettings(), options);
+  const TurnedFile turned =
+      TurnPictureFile(path, path, request, ReadOptionsFromSettings(), options);
   if (turned.changed) previous.Replaced(path);
   FileOperationResult result{previous.Operation(), {}, turned.note.shown};
   if (turned.status != Status::Ok) {
-    const std::string hint = kept ? turned.hint : std::string(Tr("There is not enough disk space to keep the old file for undo."));
-    result.failures.push_back({path, Tr(StatusMessage(turned.status)) + (hint.empty() ? "" : " ") + hint});
+    const std::string hint =
+        kept ? turned.hint
+             : std::string(Tr("There is not enough disk space to keep the old file for undo."));
+    result.failures.push_back(
+        {path, Tr(StatusMessage(turned.status)) + (hint.empty() ? "" : " ") + hint});
   }
   return result;
 }

@@ -7,7 +7,8 @@
 
 namespace fotomill::desktop {
 
-// Turns the picture in a file and keeps what the file was. Neither step nor failure where it stands so already.
+// Turns the picture in a file and keeps what the file was. Neither step nor failure where it stands
+// so already.
 FileOperationResult TurnOneFile(const std::string& path, Orientation turn);
 
 }  // namespace fotomill::desktop

@@ -31,20 +31,30 @@ constexpr HistoryColumnFacts kColumns[] = {
 };
 // clang-format on
 
-// Negative when `a` is before `b`. Where the column does not decide, the names do, and then the last use.
+// Negative when `a` is before `b`. Where the column does not decide, the names do, and then the
+// last use.
 int Compare(const HistoryRow& a, const HistoryRow& b, int32_t column) {
-  const auto larger = [](auto left, auto right) { return left > right ? -1 : left < right ? 1 : 0; };
+  const auto larger = [](auto left, auto right) {
+    return left > right ? -1 : left < right ? 1 : 0;
+  };
   int order = 0;
   switch (column) {
-    case choice::kColumnType: order = DescribeFileType(a.path).compare(DescribeFileType(b.path)); break;
-    case choice::kColumnFunction: order = FileFunctionName(a.function).compare(FileFunctionName(b.function)); break;
+    case choice::kColumnType:
+      order = DescribeFileType(a.path).compare(DescribeFileType(b.path));
+      break;
+    case choice::kColumnFunction:
+      order = FileFunctionName(a.function).compare(FileFunctionName(b.function));
+      break;
     case choice::kColumnCreated: order = larger(a.created, b.created); break;
     case choice::kColumnAccessed: order = larger(a.accessed, b.accessed); break;
     case choice::kColumnSize: order = larger(a.size, b.size); break;
-    case choice::kColumnPath: order = CompareNatural(platform::FolderOf(a.path), platform::FolderOf(b.path)); break;
+    case choice::kColumnPath:
+      order = CompareNatural(platform::FolderOf(a.path), platform::FolderOf(b.path));
+      break;
     default: break;
   }
-  if (order == 0) order = CompareNatural(platform::FileNameOf(a.path), platform::FileNameOf(b.path));
+  if (order == 0)
+    order = CompareNatural(platform::FileNameOf(a.path), platform::FileNameOf(b.path));
   return order != 0 ? order : larger(a.accessed, b.accessed);
 }
 
@@ -58,10 +68,12 @@ bool FileHistoryList::Read() {
   const bool read = LoadFileHistory(HistoryOptionsFromSettings());
   for (size_t i = 0; i < FileHistoryCount(); ++i) {
     const FileHistoryEntry entry = FileHistoryAt(i);
-    rows_.push_back({std::string(entry.path), entry.function, entry.created, entry.accessed, entry.size});
+    rows_.push_back(
+        {std::string(entry.path), entry.function, entry.created, entry.accessed, entry.size});
   }
   ClearFileHistory();
-  column_ = std::clamp(settings.FileHistorySortMode, 0, static_cast<int32_t>(std::size(kColumns)) - 1);
+  column_ =
+      std::clamp(settings.FileHistorySortMode, 0, static_cast<int32_t>(std::size(kColumns)) - 1);
   Sort();
   const std::string path = FileHistoryPath(HistoryOptionsFromSettings());
   return read || settings.FileHistoryEnable == 0 || path.empty() || !platform::FileExists(path);
@@ -109,7 +121,8 @@ bool FileHistoryList::Clear() {
 
 bool GetsThumbnail(const std::string& path) {
   if (settings.FileHistoryThumbnailMode == choice::kHistoryNoThumbnails) return false;
-  return (settings.FileHistoryDriveTypes >> static_cast<int>(platform::VolumeOf(path).kind) & 1) == 0;
+  return (settings.FileHistoryDriveTypes >> static_cast<int>(platform::VolumeOf(path).kind) & 1) ==
+         0;
 }
 
 }  // namespace fotomill::desktop

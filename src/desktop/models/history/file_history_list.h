@@ -9,8 +9,8 @@
 
 namespace fotomill::desktop {
 
-// One column of the file history's list, in the order of choice::HistoryColumn. The key holds its width in ten-thousandths
-// of the list's.
+// One column of the file history's list, in the order of choice::HistoryColumn. The key holds its
+// width in ten-thousandths of the list's.
 struct HistoryColumnFacts {
   const char* title;
   KeyNumber width;
@@ -31,10 +31,11 @@ struct HistoryRow {
 // The entries of the file history in the order of a column. Belongs to the main thread.
 class FileHistoryList {
  public:
-  // Takes up the history as its file has it now, and sorts it as FileHistorySortMode says. False when there is a file that
-  // cannot be read as one.
+  // Takes up the history as its file has it now, and sorts it as FileHistorySortMode says. False
+  // when there is a file that cannot be read as one.
   bool Read();
-  // Sorts by a column; the one that sorts already, the other way round. Times and sizes begin with the largest.
+  // Sorts by a column; the one that sorts already, the other way round. Times and sizes begin with
+  // the largest.
   void SortBy(int32_t column);
   int32_t SortColumn() const { return column_; }
   bool Reversed() const { return reversed_; }
@@ -45,8 +46,8 @@ class FileHistoryList {
   const HistoryRow& Row(size_t row) const { return rows_[row]; }
   std::string Cell(size_t row, size_t column) const;
 
-  // Takes entries out of the history file; what other programs recorded meanwhile stays. False when it could not be
-  // written: the entries are still there.
+  // Takes entries out of the history file; what other programs recorded meanwhile stays. False when
+  // it could not be written: the entries are still there.
   bool Remove(std::vector<size_t> rows);
   // Deletes the history file. False when it could not be deleted.
   bool Clear();
@@ -59,8 +60,8 @@ class FileHistoryList {
   bool reversed_ = false;
 };
 
-// Whether a row gets a thumbnail: not from drives of the kinds whose bits FileHistoryDriveTypes has set (2 removable,
-// 16 optical by default), where reading a picture may mean waiting.
+// Whether a row gets a thumbnail: not from drives of the kinds whose bits FileHistoryDriveTypes has
+// set (2 removable, 16 optical by default), where reading a picture may mean waiting.
 bool GetsThumbnail(const std::string& path);
 
 }  // namespace fotomill::desktop

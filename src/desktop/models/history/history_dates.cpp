@@ -9,11 +9,13 @@
 namespace fotomill::desktop {
 
 std::string HistoryDate(int64_t seconds, int32_t mode) {
-  static constexpr const char* kDays[] = {TrLater("Sunday"),    TrLater("Monday"),   TrLater("Tuesday"), TrLater("Wednesday"),
-                                          TrLater("Thursday"),  TrLater("Friday"),   TrLater("Saturday")};
-  static constexpr const char* kMonths[] = {TrLater("January"),   TrLater("February"), TrLater("March"),    TrLater("April"),
-                                            TrLater("May"),       TrLater("June"),     TrLater("July"),     TrLater("August"),
-                                            TrLater("September"), TrLater("October"),  TrLater("November"), TrLater("December")};
+  static constexpr const char* kDays[] = {
+      TrLater("Sunday"),   TrLater("Monday"), TrLater("Tuesday"), TrLater("Wednesday"),
+      TrLater("Thursday"), TrLater("Friday"), TrLater("Saturday")};
+  static constexpr const char* kMonths[] = {
+      TrLater("January"),   TrLater("February"), TrLater("March"),    TrLater("April"),
+      TrLater("May"),       TrLater("June"),     TrLater("July"),     TrLater("August"),
+      TrLater("September"), TrLater("October"),  TrLater("November"), TrLater("December")};
   const platform::LocalTime time = platform::LocalTimeOf(seconds);
   if (time.month < 1 || time.month > 12 || time.weekday < 0 || time.weekday > 6) return {};
   const bool full = mode == choice::kFullCivilian || mode == choice::kFullMilitary;
@@ -21,10 +23,12 @@ std::string HistoryDate(int64_t seconds, int32_t mode) {
   char date[32], clock[32];
   std::snprintf(date, sizeof date, "%04d-%02d-%02d", time.year, time.month, time.day);
   const int32_t hour = !civilian ? time.hour : time.hour % 12 == 0 ? 12 : time.hour % 12;
-  const int length = std::snprintf(clock, sizeof clock, civilian ? "%d:%02d" : "%02d:%02d", hour, time.minute);
+  const int length =
+      std::snprintf(clock, sizeof clock, civilian ? "%d:%02d" : "%02d:%02d", hour, time.minute);
   // Translators: weekday, month, day, year.
-  std::string text =
-      full ? Tr("%1, %2 %3, %4", Tr(kDays[time.weekday]), Tr(kMonths[time.month - 1]), time.day, time.year) : std::string(date);
+  std::string text = full ? Tr("%1, %2 %3, %4", Tr(kDays[time.weekday]),
+                               Tr(kMonths[time.month - 1]), time.day, time.year)
+                          : std::string(date);
   text.append(" ").append(clock, static_cast<size_t>(length));
   if (full) {
     std::snprintf(clock, sizeof clock, ":%02d", time.second);

@@ -21,9 +21,11 @@ struct ExifRow {
 // The EXIF of one picture file as the viewer shows it.
 struct ExifReport {
   Status status = Status::Ok;
-  std::string problem;  // a sentence for people where there is nothing to show, or not all; empty otherwise
+  // a sentence for people where there is nothing to show, or not all; empty otherwise
+  std::string problem;
   std::vector<ExifRow> rows;
-  std::string text;                     // the same lines as one text, to be copied, saved or printed
+  // the same lines as one text, to be copied, saved or printed
+  std::string text;
   RgbImage thumbnail;                   // decoded; empty if there is none that can be
   std::vector<uint8_t> thumbnailBytes;  // as it is in the block: a JPEG stream
 };

@@ -26,7 +26,9 @@ constexpr const char* kDetailsTitle = TrLater("Details");
 constexpr const char* kFileName = TrLater("File name");
 
 // A resolution: whole, or with two digits.
-std::string DpiText(double dpi) { return DecimalText(dpi, std::abs(dpi - std::round(dpi)) < 0.005 ? 0 : 2); }
+std::string DpiText(double dpi) {
+  return DecimalText(dpi, std::abs(dpi - std::round(dpi)) < 0.005 ? 0 : 2);
+}
 
 std::string PixelsText(int32_t width, int32_t height) {
   const double millions = static_cast<double>(width) * height / 1e6;
@@ -36,7 +38,8 @@ std::string PixelsText(int32_t width, int32_t height) {
 
 std::string BytesText(uint64_t bytes) { return TrCount("%1 byte", "%1 bytes", bytes); }
 
-// How large the picture is on paper at its own resolution, or at the assumed one when the file has none.
+// How large the picture is on paper at its own resolution, or at the assumed one when the file has
+// none.
 std::string PrintSize(const PictureRecord& picture, const InfoOptions& options) {
   const bool own = picture.metadata.dpiX > 0 && picture.metadata.dpiY > 0;
   const double assumed = std::max(options.resolution, 1);
@@ -45,14 +48,18 @@ std::string PrintSize(const PictureRecord& picture, const InfoOptions& options) 
   switch (options.units) {
     case choice::kPixels: return {};
     case choice::kCentimetres:
-      text = Tr("%1 x %2 centimeters", DecimalText(picture.width / x * 2.54, 2), DecimalText(picture.height / y * 2.54, 2));
+      text = Tr("%1 x %2 centimeters", DecimalText(picture.width / x * 2.54, 2),
+                DecimalText(picture.height / y * 2.54, 2));
       break;
-    default: text = Tr("%1 x %2 inches", DecimalText(picture.width / x, 2), DecimalText(picture.height / y, 2));
+    default:
+      text = Tr("%1 x %2 inches", DecimalText(picture.width / x, 2),
+                DecimalText(picture.height / y, 2));
   }
   return own ? text : Tr("%1 at %2 dots per inch", text, DpiText(assumed));
 }
 
-void AddFileFacts(const std::string& path, const InfoOptions& options, FileInfo& info, InfoSection& general) {
+void AddFileFacts(const std::string& path, const InfoOptions& options, FileInfo& info,
+                  InfoSection& general) {
   const platform::FileFacts facts = platform::FactsOf(path);
   general.lines.push_back({Tr(kFileName), std::string(platform::FileNameOf(path))});
   const platform::PathParts parts = platform::SplitPath(path);
@@ -64,24 +71,28 @@ void AddFileFacts(const std::string& path, const InfoOptions& options, FileInfo&
   general.lines.push_back({Tr("Changed"), HistoryDate(facts.modified, options.dateMode)});
 }
 
-void AddPictureFacts(const PictureRecord& picture, const InfoOptions& options, FileInfo& info, InfoSection& general) {
+void AddPictureFacts(const PictureRecord& picture, const InfoOptions& options, FileInfo& info,
+                     InfoSection& general) {
   const FormatEntry& row = FormatRow(picture.formatIndex);
   info.format = row.description.view();
   info.width = picture.width;
   info.height = picture.height;
   info.imageBytes = picture.imageBytes;
   general.lines.push_back({Tr("Format"), info.format});
-  if (!picture.typeName.empty()) general.lines.push_back({Tr("Type"), std::string(picture.typeName.view())});
+  if (!picture.typeName.empty())
+    general.lines.push_back({Tr("Type"), std::string(picture.typeName.view())});
   general.lines.push_back({Tr("Dimensions"), PixelsText(picture.width, picture.height)});
   std::string depth = TrCount("%1 bit", "%1 bits", static_cast<uint64_t>(picture.bitsPerPixel));
   if ((picture.alphaFlags & kHasAlpha) != 0) depth = Tr("%1 and alpha", depth);
   general.lines.push_back({Tr("Depth"), depth});
-  if (picture.pageCount > 1) general.lines.push_back({Tr("Pages"), std::to_string(picture.pageCount)});
+  if (picture.pageCount > 1)
+    general.lines.push_back({Tr("Pages"), std::to_string(picture.pageCount)});
   if (picture.metadata.dpiX > 0 && picture.metadata.dpiY > 0) {
     general.lines.push_back(
         {Tr("Resolution"), Tr("%1 x %2 dots per inch", DpiText(picture.metadata.dpiX), DpiText(picture.metadata.dpiY))});
   }
-  if (std::string size = PrintSize(picture, options); !size.empty()) general.lines.push_back({Tr("Print size"), std::move(size)});
+  if (std::string size = PrintSize(picture, options); !size.empty())
+    general.lines.push_back({Tr("Print size"), std::move(size)});
   general.lines.push_back({Tr("Image data"), BytesText(picture.imageBytes)});
 }
 
@@ -94,7 +105,8 @@ InfoSection DetailsOf(const PictureRecord& picture) {
     if (colon == std::string_view::npos) {
       section.lines.push_back({{}, std::string(line)});
     } else {
-      // Codecs put blanks in front of the names, so that the values of their lines stand in one column.
+      // Codecs put blanks in front of the names, so that the values of their lines stand in one
+      // column.
       const std::string_view name = line.substr(0, colon);
       section.lines.push_back(
           {std::string(name.substr(std::min(name.find_first_not_of(' '), colon))), std::string(line.substr(colon + 2))});
@@ -115,18 +127,22 @@ void AddExif(const std::string& path, const InfoOptions& options, FileInfo& info
 
 std::string ProblemOf(const std::string& path, Status status) {
   const std::string hint = OpenHint(path, status);
-  return hint.empty() ? Tr(StatusMessage(status)) : Tr(StatusMessage(status)).append(" ").append(hint);
+  return hint.empty() ? Tr(StatusMessage(status))
+                      : Tr(StatusMessage(status)).append(" ").append(hint);
 }
 
-// How a value differs: every different one with the number of files that have it, the most frequent first.
+// How a value differs: every different one with the number of files that have it, the most frequent
+// first.
 std::string SpreadOf(const std::map<std::string, size_t>& counts) {
   constexpr size_t kMost = 4;
   std::vector<std::pair<std::string, size_t>> values(counts.begin(), counts.end());
-  std::ranges::stable_sort(values, [](const auto& a, const auto& b) { return a.second > b.second; });
+  std::ranges::stable_sort(values,
+                           [](const auto& a, const auto& b) { return a.second > b.second; });
   std::string list;
   for (size_t i = 0; i < std::min(values.size(), kMost); ++i) {
     if (i > 0) list += "; ";
-    list += values[i].second > 1 ? Tr("%1 (%2 files)", values[i].first, values[i].second) : values[i].first;
+    list += values[i].second > 1 ? Tr("%1 (%2 files)", values[i].first, values[i].second)
+                                 : values[i].first;
   }
   return Tr("%1 different: %2", values.size(), values.size() > kMost ? list + "; ..." : list);
 }
@@ -142,7 +158,8 @@ std::vector<Compared> Compare(std::span<const FileInfo> files) {
   std::unordered_map<std::string_view, size_t> places;
   for (const FileInfo& file : files) {
     for (const InfoSection& section : file.sections) {
-      if (section.title == Tr(kDetailsTitle)) continue;  // they mean something in files of one format only
+      // they mean something in files of one format only
+      if (section.title == Tr(kDetailsTitle)) continue;
       for (const InfoLine& line : section.lines) {
         if (line.label.empty() || line.label == Tr(kFileName)) continue;
         const auto [place, added] = places.emplace(line.label, all.size());
@@ -178,34 +195,39 @@ FileInfo ReadFileInfo(const std::string& path, const InfoOptions& options) {
   }
   if (info.status != Status::Ok) info.problem = ProblemOf(path, info.status);
   info.sections.push_back(std::move(general));
-  if (picture != nullptr && picture->detailLines.Count() > 0) info.sections.push_back(DetailsOf(*picture));
+  if (picture != nullptr && picture->detailLines.Count() > 0)
+    info.sections.push_back(DetailsOf(*picture));
   if (picture != nullptr) AddExif(path, options, info);
   return info;
 }
 
 std::vector<InfoSection> SummaryOf(std::span<const FileInfo> files) {
-  InfoSection totals{Tr("Totals"), {}}, same{Tr("The same in all"), {}}, different{Tr("Different"), {}},
-      failed{Tr("Could not be read"), {}};
+  InfoSection totals{Tr("Totals"), {}}, same{Tr("The same in all"), {}},
+      different{Tr("Different"), {}}, failed{Tr("Could not be read"), {}};
   uint64_t size = 0, imageBytes = 0, pixels = 0, pictures = 0;
   for (const FileInfo& file : files) {
     size += file.size;
     imageBytes += file.imageBytes;
     pixels += static_cast<uint64_t>(file.width) * static_cast<uint64_t>(file.height);
     pictures += file.width > 0;
-    if (file.status != Status::Ok) failed.lines.push_back({std::string(platform::FileNameOf(file.path)), file.problem});
+    if (file.status != Status::Ok)
+      failed.lines.push_back({std::string(platform::FileNameOf(file.path)), file.problem});
   }
   totals.lines.push_back({Tr("Files"), std::to_string(files.size())});
   totals.lines.push_back({Tr("Pictures"), std::to_string(pictures)});
   totals.lines.push_back({Tr("File size"), BytesText(size)});
   totals.lines.push_back({Tr("Image data"), BytesText(imageBytes)});
-  totals.lines.push_back({Tr("Pixels"), Tr("%1 million", DecimalText(static_cast<double>(pixels) / 1e6, 1))});
+  totals.lines.push_back(
+      {Tr("Pixels"), Tr("%1 million", DecimalText(static_cast<double>(pixels) / 1e6, 1))});
   for (const Compared& compared : Compare(files)) {
     if (compared.files < 2) continue;
     if (compared.values.size() == 1 && compared.files == files.size()) {
       same.lines.push_back({compared.label, compared.values.begin()->first});
     } else {
-      std::string text = compared.values.size() > 1 ? SpreadOf(compared.values) : compared.values.begin()->first;
-      if (compared.files < files.size()) text = Tr("%1 (in %2 of %3 files)", text, compared.files, files.size());
+      std::string text =
+          compared.values.size() > 1 ? SpreadOf(compared.values) : compared.values.begin()->first;
+      if (compared.files < files.size())
+        text = Tr("%1 (in %2 of %3 files)", text, compared.files, files.size());
       different.lines.push_back({compared.label, std::move(text)});
     }
   }

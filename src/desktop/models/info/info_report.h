@@ -45,7 +45,8 @@ struct FileInfo {
 // Opens a file's header and gathers its facts; any thread may call it.
 FileInfo ReadFileInfo(const std::string& path, const InfoOptions& options);
 
-// What several files have together: totals, what is the same in all of them, and what differs with its values.
+// What several files have together: totals, what is the same in all of them, and what differs with
+// its values.
 std::vector<InfoSection> SummaryOf(std::span<const FileInfo> files);
 
 // Sections as a text: titles, and lines "label: value" set in beneath them.

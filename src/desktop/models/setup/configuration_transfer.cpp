@@ -12,9 +12,11 @@ namespace fotomill::desktop {
 
 Transfer ExportConfiguration(const std::string& path) {
   const SaveResult saved = SaveConfiguration();
-  if (saved != SaveResult::Done && saved != SaveResult::Unchanged) return {false, Tr(SaveMessage(saved))};
+  if (saved != SaveResult::Done && saved != SaveResult::Unchanged)
+    return {false, Tr(SaveMessage(saved))};
   const auto block = LoadConfigurationBlock();
-  if (!block && platform::FileExists(ConfigurationPath())) return {false, Tr("The configuration file could not be read.")};
+  if (!block && platform::FileExists(ConfigurationPath()))
+    return {false, Tr("The configuration file could not be read.")};
   if (!block) return {false, Tr("Nothing to export: all settings have their defaults.")};
   if (!platform::WriteWholeFile(path, *block)) {
     return {false, Tr("The file could not be written. Choose another folder or name.")};
@@ -44,15 +46,19 @@ Transfer ImportConfiguration(const std::string& path) {
     KeepSetting(*row);
     ++taken;
   }
-  if (IsWideText(text) || seen.none()) return {false, Tr("The file has no settings of this program.")};
+  if (IsWideText(text) || seen.none())
+    return {false, Tr("The file has no settings of this program.")};
   const SaveResult saved = SaveConfiguration();
   Transfer transfer{saved == SaveResult::Done || saved == SaveResult::Unchanged, {}};
-  transfer.message =
-      TrCount("%1 setting was imported; all others are unchanged.", "%1 settings were imported; all others are unchanged.", taken);
+  transfer.message = TrCount("%1 setting was imported; all others are unchanged.",
+                             "%1 settings were imported; all others are unchanged.", taken);
   if (refused > 0) {
-    transfer.message.append(" ").append(TrCount("%1 value was invalid.", "%1 values were invalid.", refused));
+    transfer.message.append(" ").append(
+        TrCount("%1 value was invalid.", "%1 values were invalid.", refused));
   }
-  if (unknown > 0) transfer.message.append(" ").append(TrCount("%1 key is unknown.", "%1 keys are unknown.", unknown));
+  if (unknown > 0)
+    transfer.message.append(" ").append(
+        TrCount("%1 key is unknown.", "%1 keys are unknown.", unknown));
   if (!transfer.ok) transfer.message.append(" ").append(Tr(SaveMessage(saved)));
   return transfer;
 }

@@ -10,11 +10,11 @@ struct Transfer {
   std::string message;
 };
 
-// Writes the configuration file as it is, behind its comment header, to a file of the user's; one that is there is
-// replaced in one step. What was changed and not saved yet is saved first.
+// Writes the configuration file as it is, behind its comment header, to a file of the user's; one
+// that is there is replaced in one step. What was changed and not saved yet is saved first.
 Transfer ExportConfiguration(const std::string& path);
-// Takes the values of all keys that a file of that form holds, and saves them; other keys stay as they are. Values that no
-// key takes are passed over and counted.
+// Takes the values of all keys that a file of that form holds, and saves them; other keys stay as
+// they are. Values that no key takes are passed over and counted.
 Transfer ImportConfiguration(const std::string& path);
 
 }  // namespace fotomill::desktop

@@ -11,7 +11,10 @@ constexpr std::string_view kSection = "Desktop", kKey = "Language";
 
 }  // namespace
 
-std::string StoredLanguage() { return std::string(FindIniValue(ConfigurationText(), kSection, kKey).value_or(std::string_view())); }
+std::string StoredLanguage() {
+  return std::string(
+      FindIniValue(ConfigurationText(), kSection, kKey).value_or(std::string_view()));
+}
 
 bool StoreLanguage(const std::string& code) {
   if (code == StoredLanguage()) return true;

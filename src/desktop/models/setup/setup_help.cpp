@@ -15,7 +15,8 @@ constexpr Topic kTopics[] = {
     {"RENAME", "Renaming in sequence"},
 };
 
-// The lines between a heading of the third rank and the next heading; empty if there is no such heading.
+// The lines between a heading of the third rank and the next heading; empty if there is no such
+// heading.
 std::string_view EntryOf(std::string_view page, std::string_view title) {
   const std::string heading = "\n### " + std::string(title) + "\n";
   const size_t start = page.find(heading);
@@ -32,7 +33,8 @@ std::string_view ReadLine(std::string_view& text) {
 
 // Lines that stand by themselves: headings, items of lists, rows of tables, what is set in.
 bool StandsAlone(std::string_view line) {
-  return line.starts_with("    ") || line.starts_with("#") || line.starts_with("- ") || line.starts_with("|") ||
+  return line.starts_with("    ") || line.starts_with("#") || line.starts_with("- ") ||
+         line.starts_with("|") ||
          (line.size() > 2 && line[0] >= '1' && line[0] <= '9' && line.substr(1, 2) == ". ");
 }
 
@@ -96,7 +98,8 @@ bool HasHelpEntry(std::string_view key) { return !EntryOf(kSettingsPage, key).em
 
 HelpText HelpOn(std::string_view topic) {
   for (const Topic& row : kTopics) {
-    if (row.topic == topic) return {std::string(row.heading), PlainText(EntryOf(kDesktopPage, row.heading))};
+    if (row.topic == topic)
+      return {std::string(row.heading), PlainText(EntryOf(kDesktopPage, row.heading))};
   }
   if (HasHelpEntry(topic)) return {std::string(topic), PlainText(EntryOf(kSettingsPage, topic))};
   return WholePage(topic == kManual ? kDesktopPage : kConfigurationPage);

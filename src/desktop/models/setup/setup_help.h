@@ -6,7 +6,8 @@
 namespace fotomill::desktop {
 
 // Pages of the documentation that the program carries with it, as docs/ has them.
-extern const std::string_view kSettingsPage;       // docs/settings.md: an entry "### KEY" for each key that Setup shows
+// docs/settings.md: an entry "### KEY" for each key that Setup shows
+extern const std::string_view kSettingsPage;
 extern const std::string_view kConfigurationPage;  // docs/configuration.md
 extern const std::string_view kDesktopPage;        // docs/desktop.md, the manual
 
@@ -17,8 +18,8 @@ struct HelpText {
 };
 // The topic that stands for the whole manual.
 inline constexpr std::string_view kManual = "desktop";
-// The entry of a key, the part of the manual for a topic that a Help button names, or the manual; for anything else the
-// page about the configuration as a whole.
+// The entry of a key, the part of the manual for a topic that a Help button names, or the manual;
+// for anything else the page about the configuration as a whole.
 HelpText HelpOn(std::string_view topic);
 // Whether a key has an entry of its own.
 bool HasHelpEntry(std::string_view key);

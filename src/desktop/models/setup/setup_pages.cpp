@@ -125,9 +125,10 @@ constexpr SetupItem kItems[] = {
 };
 // clang-format on
 
-constexpr const char* kTitles[] = {TrLater("Browsing"),      TrLater("Thumbnails"),   TrLater("Viewing"), TrLater("Batches"),
-                                   TrLater("Saving"),        TrLater("File names"),   TrLater("Colors"),
-                                   TrLater("EXIF and info"), TrLater("File history"), TrLater("Formats")};
+constexpr const char* kTitles[] = {
+    TrLater("Browsing"),     TrLater("Thumbnails"), TrLater("Viewing"), TrLater("Batches"),
+    TrLater("Saving"),       TrLater("File names"), TrLater("Colors"),  TrLater("EXIF and info"),
+    TrLater("File history"), TrLater("Formats")};
 static_assert(std::size(kTitles) == kSetupPageCount);
 
 consteval bool EveryItemIsShownOnce() {
@@ -144,12 +145,15 @@ static_assert(EveryItemIsShownOnce());
 // The rows above, and at the end of the page Saving those that the formats have themselves.
 std::vector<SetupItem> WithSettingsOfFormats() {
   std::vector<SetupItem> items(std::begin(kItems), std::end(kItems));
-  auto place = std::ranges::find_if(items, [](const SetupItem& item) { return item.page > Saving; });
+  auto place =
+      std::ranges::find_if(items, [](const SetupItem& item) { return item.page > Saving; });
   for (const FormatSettings* const codec : SettingsOfFormats()) {
     for (const FormatSetting& setting : codec->keys) {
       const KeyRow* const row = FindKey(setting.key);
       if (row == nullptr || *setting.label == '\0') continue;
-      place = items.insert(place, {Saving, codec->group, static_cast<KeyNumber>(NumberOfKey(*row)), setting.label}) + 1;
+      place = items.insert(place, {Saving, codec->group, static_cast<KeyNumber>(NumberOfKey(*row)),
+                                   setting.label}) +
+              1;
     }
   }
   return items;
@@ -157,7 +161,8 @@ std::vector<SetupItem> WithSettingsOfFormats() {
 
 std::string SearchedText(const SetupItem& item) {
   const char* const name = KeyOf(item.key).name;
-  std::string text = std::string(Tr(TitleOf(item.page))) + " " + Tr(item.group) + " " + Tr(item.label) + " " + name;
+  std::string text = std::string(Tr(TitleOf(item.page))) + " " + Tr(item.group) + " " +
+                     Tr(item.label) + " " + name;
   return LowerCase(text.append(" ").append(HelpOn(name).text));
 }
 
@@ -172,7 +177,8 @@ std::span<const SetupItem> SetupItems() {
 
 std::vector<SetupItem> ItemsOf(SetupPage page) {
   std::vector<SetupItem> items;
-  std::ranges::copy_if(SetupItems(), std::back_inserter(items), [&](const SetupItem& item) { return item.page == page; });
+  std::ranges::copy_if(SetupItems(), std::back_inserter(items),
+                       [&](const SetupItem& item) { return item.page == page; });
   return items;
 }
 

@@ -10,13 +10,24 @@
 namespace fotomill::desktop {
 
 // The pages of Setup, in the order of the list at its left.
-enum class SetupPage { Browsing, Thumbnails, Viewing, Batches, Saving, Names, Colors, Metadata, History, Formats };
+enum class SetupPage {
+  Browsing,
+  Thumbnails,
+  Viewing,
+  Batches,
+  Saving,
+  Names,
+  Colors,
+  Metadata,
+  History,
+  Formats
+};
 inline constexpr size_t kSetupPageCount = 10;
 const char* TitleOf(SetupPage page);
 
-// One setting in a Setup page or an option box: its page, the box around it, the key, its label. Rows of one page and
-// group stand together, in the order in which they are shown. A new setting in Setup is one row here, or of a format one in
-// its rows.cpp, and one entry in docs/settings.md.
+// One setting in a Setup page or an option box: its page, the box around it, the key, its label.
+// Rows of one page and group stand together, in the order in which they are shown. A new setting in
+// Setup is one row here, or of a format one in its rows.cpp, and one entry in docs/settings.md.
 struct SetupItem {
   SetupPage page;
   const char* group;
@@ -27,8 +38,8 @@ struct SetupItem {
 std::span<const SetupItem> SetupItems();
 std::vector<SetupItem> ItemsOf(SetupPage page);
 
-// Settings whose label, group, page, key or help holds every word of `words`, whatever the case; in the order of the rows.
-// Nothing for an empty text.
+// Settings whose label, group, page, key or help holds every word of `words`, whatever the case; in
+// the order of the rows. Nothing for an empty text.
 std::vector<SetupItem> FindSettings(std::string_view words);
 
 // The file functions that FileHistoryFunctions switches, one bit each: a list to tick.

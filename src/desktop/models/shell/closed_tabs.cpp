@@ -16,7 +16,8 @@ void ClosedTabs::Add(const std::string& folder) {
   std::erase(folders_, folder);
   folders_.push_back(folder);
   const size_t most = static_cast<size_t>(std::max(settings.TabHistoryMax, 1));
-  if (folders_.size() > most) folders_.erase(folders_.begin(), folders_.end() - static_cast<ptrdiff_t>(most));
+  if (folders_.size() > most)
+    folders_.erase(folders_.begin(), folders_.end() - static_cast<ptrdiff_t>(most));
   (void)AddToHistoryList(HistoryList::Tabs, folder);
 }
 

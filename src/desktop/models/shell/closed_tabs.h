@@ -6,7 +6,8 @@
 
 namespace fotomill::desktop {
 
-// The folders of the tabs that were closed last, TabHistoryMax at most. They are kept for later runs.
+// The folders of the tabs that were closed last, TabHistoryMax at most. They are kept for later
+// runs.
 class ClosedTabs {
  public:
   // Takes up the list of earlier runs. Add puts a folder on top and writes the list.

@@ -31,7 +31,8 @@ bool EventLogOn() { return logFile != nullptr; }
 void LogEvent(std::string_view event, std::string_view text) {
   if (logFile == nullptr) return;
   const std::string line = std::string(event) + (text.empty() ? "" : " ") + EscapeControls(text);
-  std::fprintf(logFile.get(), "%.3f %s\n", platform::MonotonicSeconds() - startSeconds, line.c_str());
+  std::fprintf(logFile.get(), "%.3f %s\n", platform::MonotonicSeconds() - startSeconds,
+               line.c_str());
   std::fflush(logFile.get());
 }
 

@@ -17,15 +17,18 @@ namespace {
 constexpr const char* kFile = "FMWFavourites.txt";
 constexpr size_t kMostFolders = 200;
 
-// Changes the list as it is in the file now. The list afterwards; as it was when the file cannot be written.
-bool EditList(std::vector<std::string>& folders, const std::function<void(std::vector<std::string>&)>& edit) {
+// Changes the list as it is in the file now. The list afterwards; as it was when the file cannot be
+// written.
+bool EditList(std::vector<std::string>& folders,
+              const std::function<void(std::vector<std::string>&)>& edit) {
   std::vector<std::string> changed;
-  const EditResult result = EditTextFile(DataFile(kFile), limits.listFileBytes, [&](std::string& text) {
-    changed = ParseHistoryList(text, kMostFolders);
-    edit(changed);
-    text.clear();
-    for (const std::string& folder : changed) text.append(folder).append(platform::kLineEnd);
-  });
+  const EditResult result =
+      EditTextFile(DataFile(kFile), limits.listFileBytes, [&](std::string& text) {
+        changed = ParseHistoryList(text, kMostFolders);
+        edit(changed);
+        text.clear();
+        for (const std::string& folder : changed) text.append(folder).append(platform::kLineEnd);
+      });
   if (result != EditResult::Done && result != EditResult::Unchanged) return false;
   folders = std::move(changed);
   return true;
@@ -40,22 +43,28 @@ void Favourites::Load() {
   folders_ = ParseHistoryList(text, kMostFolders);
 }
 
-bool Favourites::Has(const std::string& folder) const { return std::ranges::find(folders_, folder) != folders_.end(); }
+bool Favourites::Has(const std::string& folder) const {
+  return std::ranges::find(folders_, folder) != folders_.end();
+}
 
 bool Favourites::Add(const std::string& folder) {
   if (ParseHistoryList(folder, 1) != std::vector{folder}) return false;  // it cannot be on a line
   const bool written = EditList(folders_, [&](std::vector<std::string>& folders) {
-    if (std::ranges::find(folders, folder) == folders.end() && folders.size() < kMostFolders) folders.push_back(folder);
+    if (std::ranges::find(folders, folder) == folders.end() && folders.size() < kMostFolders)
+      folders.push_back(folder);
   });
   return written && Has(folder);
 }
 
 bool Favourites::Remove(const std::string& folder) {
-  return EditList(folders_, [&](std::vector<std::string>& folders) { std::erase(folders, folder); });
+  return EditList(folders_,
+                  [&](std::vector<std::string>& folders) { std::erase(folders, folder); });
 }
 
 bool Favourites::FollowRename(const std::string& from, const std::string& to) {
-  if (std::ranges::none_of(folders_, [&](const std::string& folder) { return LiesIn(folder, from); })) return false;
+  if (std::ranges::none_of(folders_,
+                           [&](const std::string& folder) { return LiesIn(folder, from); }))
+    return false;
   return EditList(folders_, [&](std::vector<std::string>& folders) {
     for (std::string& folder : folders) folder = RenamedPath(folder, from, to);
   });

@@ -5,8 +5,9 @@
 
 namespace fotomill::desktop {
 
-// The folders that the user wants at hand, in the order in which they were added. Kept in the data folder in the file
-// "FMWFavourites.txt", a folder a line; changes are merged with those of other processes and written at once.
+// The folders that the user wants at hand, in the order in which they were added. Kept in the data
+// folder in the file "FMWFavourites.txt", a folder a line; changes are merged with those of other
+// processes and written at once.
 class Favourites {
  public:
   // Takes up the folders that the file holds now.
@@ -17,7 +18,8 @@ class Favourites {
   // False when the folder cannot be on a line, there are too many, or the file cannot be written.
   [[nodiscard]] bool Add(const std::string& folder);
   [[nodiscard]] bool Remove(const std::string& folder);
-  // A folder was renamed: it, and those in it, are found under the new name. True when that concerns one of them.
+  // A folder was renamed: it, and those in it, are found under the new name. True when that
+  // concerns one of them.
   bool FollowRename(const std::string& from, const std::string& to);
 
  private:

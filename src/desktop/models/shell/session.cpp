@@ -14,7 +14,9 @@ namespace {
 constexpr uint64_t kLongestFile = 1024 * 1024;
 constexpr size_t kMostTabs = 200;
 
-bool FitsLine(std::string_view text) { return text.find_first_of(std::string_view("\n\r\0", 3)) == std::string_view::npos; }
+bool FitsLine(std::string_view text) {
+  return text.find_first_of(std::string_view("\n\r\0", 3)) == std::string_view::npos;
+}
 
 int32_t Number(std::string_view value) {
   return static_cast<int32_t>(std::clamp<int64_t>(LeadingInteger(value), INT32_MIN, INT32_MAX));
@@ -38,7 +40,9 @@ void ReadTabValue(SessionTab& tab, std::string_view key, std::string_view value)
   if (key == "Focus") tab.focus = value;
 }
 
-std::string Line(const char* key, std::string_view value) { return std::string(key).append("=").append(value).append("\n"); }
+std::string Line(const char* key, std::string_view value) {
+  return std::string(key).append("=").append(value).append("\n");
+}
 std::string Line(const char* key, int64_t value) { return Line(key, std::to_string(value)); }
 
 }  // namespace
@@ -69,11 +73,14 @@ Session ParseSession(std::string_view text) {
 
 std::string SessionText(const Session& session) {
   std::string text = "[Frame]\n" + Line("Width", session.width) + Line("Height", session.height) +
-                     Line("Maximized", session.maximized ? 1 : 0) + Line("Tab", static_cast<int64_t>(session.tab));
-  if (!session.columns.empty() && FitsLine(session.columns)) text += Line("Columns", session.columns);
+                     Line("Maximized", session.maximized ? 1 : 0) +
+                     Line("Tab", static_cast<int64_t>(session.tab));
+  if (!session.columns.empty() && FitsLine(session.columns))
+    text += Line("Columns", session.columns);
   for (const SessionTab& tab : session.tabs) {
     if (!FitsLine(tab.folder)) continue;
-    text += "[Tab]\n" + Line("Folder", tab.folder) + Line("ThumbnailMode", tab.view.modes.thumbnails) +
+    text += "[Tab]\n" + Line("Folder", tab.folder) +
+            Line("ThumbnailMode", tab.view.modes.thumbnails) +
             Line("ViewMode", tab.view.modes.view) + Line("SortMode", tab.view.modes.sort) +
             Line("Descending", tab.view.descending ? 1 : 0) + Line("Scroll", tab.scroll);
     if (FitsLine(tab.focus)) text += Line("Focus", tab.focus);
@@ -84,7 +91,9 @@ std::string SessionText(const Session& session) {
 Session LoadSession() {
   std::string text;
   const std::string path = DataFile(settings.TabsetCurrentName);
-  if (path.empty() || platform::ReadWholeFile(path, kLongestFile, text) != platform::ReadResult::Done) return {};
+  if (path.empty() ||
+      platform::ReadWholeFile(path, kLongestFile, text) != platform::ReadResult::Done)
+    return {};
   Session session = ParseSession(text);
   const size_t front = session.tab;
   std::vector<SessionTab> there;
@@ -102,7 +111,8 @@ Session LoadSession() {
 
 bool SaveSession(const Session& session) {
   const std::string path = DataFile(settings.TabsetCurrentName);
-  return !path.empty() && platform::MakeFolders(DataFolder()) && platform::WriteWholeFile(path, SessionText(session));
+  return !path.empty() && platform::MakeFolders(DataFolder()) &&
+         platform::WriteWholeFile(path, SessionText(session));
 }
 
 }  // namespace fotomill::desktop

@@ -9,11 +9,14 @@
 
 namespace fotomill::desktop {
 
-// What is open: the tabs of a frame and its size. Kept as a text in the data folder, under the name TabsetCurrentName:
+// What is open: the tabs of a frame and its size. Kept as a text in the data folder, under the name
+// TabsetCurrentName:
 //
-//   [Frame]            Width, Height (device-independent pixels), Maximized, Columns (of the details), Tab (the
+//   [Frame]            Width, Height (device-independent pixels), Maximized, Columns (of the
+//   details), Tab (the
 //                      one in front, from 0)
-//   [Tab]              Folder, ThumbnailMode, ViewMode, SortMode, Descending, Scroll (pixels), Focus (a name)
+//   [Tab]              Folder, ThumbnailMode, ViewMode, SortMode, Descending, Scroll (pixels),
+//   Focus (a name)
 //
 // a line "KEY=VALUE" each; lines that are not understood are passed over.
 struct SessionTab {

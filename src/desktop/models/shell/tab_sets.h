@@ -6,8 +6,8 @@
 
 namespace fotomill::desktop {
 
-// Named sets of tabs: files "NAME.fmwtabset" in the data folder, as session.h describes them. TabsetCurrentName names the one in
-// use, to which the tabs of this run are written in the end.
+// Named sets of tabs: files "NAME.fmwtabset" in the data folder, as session.h describes them.
+// TabsetCurrentName names the one in use, to which the tabs of this run are written in the end.
 
 // The names of all sets, in order.
 std::vector<std::string> TabSetNames();

@@ -22,8 +22,10 @@ constexpr char kHidden = '-';
 std::vector<ToolbarButton> ParseToolbar(std::string_view text, std::span<const std::string> known) {
   std::vector<ToolbarButton> buttons;
   const auto add = [&](std::string_view name, bool shown) {
-    const bool there = std::ranges::any_of(buttons, [&](const ToolbarButton& button) { return button.name == name; });
-    if (!there && std::ranges::find(known, name) != known.end()) buttons.push_back({std::string(name), shown});
+    const bool there = std::ranges::any_of(
+        buttons, [&](const ToolbarButton& button) { return button.name == name; });
+    if (!there && std::ranges::find(known, name) != known.end())
+      buttons.push_back({std::string(name), shown});
   };
   for (std::string_view line : ParseHistoryList(std::string(text), kMostButtons)) {
     const bool hidden = line.starts_with(kHidden);
@@ -41,13 +43,14 @@ std::vector<ToolbarButton> LoadToolbar(std::span<const std::string> known) {
 }
 
 bool SaveToolbar(std::span<const ToolbarButton> buttons) {
-  const EditResult result = EditTextFile(DataFile(kFile), limits.listFileBytes, [&](std::string& text) {
-    text.clear();
-    for (const ToolbarButton& button : buttons) {
-      if (!button.shown) text += kHidden;
-      text.append(button.name).append(platform::kLineEnd);
-    }
-  });
+  const EditResult result =
+      EditTextFile(DataFile(kFile), limits.listFileBytes, [&](std::string& text) {
+        text.clear();
+        for (const ToolbarButton& button : buttons) {
+          if (!button.shown) text += kHidden;
+          text.append(button.name).append(platform::kLineEnd);
+        }
+      });
   return result == EditResult::Done || result == EditResult::Unchanged;
 }
 

@@ -15,8 +15,9 @@ struct ToolbarButton {
   bool operator==(const ToolbarButton&) const = default;
 };
 
-// The buttons in the order of a text with a name a line, "-" in front of those that are hidden. Names that `known` does not
-// have are passed over; known ones that the text does not have follow at the end, shown.
+// The buttons in the order of a text with a name a line, "-" in front of those that are hidden.
+// Names that `known` does not have are passed over; known ones that the text does not have follow
+// at the end, shown.
 std::vector<ToolbarButton> ParseToolbar(std::string_view text, std::span<const std::string> known);
 
 // As the user has chosen them, kept in the data folder in the file "FMWToolbar.txt".

@@ -24,24 +24,28 @@ namespace {
 bool ReadCurrentFile(const ThumbnailRequest& request, ThumbnailRecord& record) {
   const std::string path = ThumbnailPathFor(request.path);
   const platform::FileFacts facts = platform::FactsOf(path);
-  return facts.kind == platform::FileKind::Regular && facts.modified >= request.modified && ReadThumbnailFile(record, path);
+  return facts.kind == platform::FileKind::Regular && facts.modified >= request.modified &&
+         ReadThumbnailFile(record, path);
 }
 
-bool InDatabase(const ThumbnailRequest& request) { return request.mode == choice::kGlobalDatabase || request.mode == choice::kLocalDatabase; }
+bool InDatabase(const ThumbnailRequest& request) {
+  return request.mode == choice::kGlobalDatabase || request.mode == choice::kLocalDatabase;
+}
 
 std::string DatabaseFor(const ThumbnailRequest& request) {
-  return ThumbnailDatabasePath(request.mode == choice::kGlobalDatabase ? std::string()
-                                                                    : platform::FolderOf(request.path));
+  return ThumbnailDatabasePath(
+      request.mode == choice::kGlobalDatabase ? std::string() : platform::FolderOf(request.path));
 }
 
-// The database that was asked last stays open: its index is what makes a search quick. New records are gathered, since
-// every append waits for the disk.
+// The database that was asked last stays open: its index is what makes a search quick. New records
+// are gathered, since every append waits for the disk.
 class OpenDatabase {
  public:
   bool Find(const ThumbnailRequest& request, ThumbnailRecord& record) {
     const std::lock_guard lock(mutex_);
     hidden_ = request.options.hidden;
-    return Open(DatabaseFor(request), false) && database_.Find(request.path, VolumeKeyFor(request.path), record);
+    return Open(DatabaseFor(request), false) &&
+           database_.Find(request.path, VolumeKeyFor(request.path), record);
   }
   void Add(const ThumbnailRequest& request, const ThumbnailRecord& record) {
     const std::lock_guard lock(mutex_);
@@ -68,14 +72,16 @@ class OpenDatabase {
     if (path == openPath_) return true;
     openPath_.clear();
     database_.CloseThumbnailDatabase();
-    if (database_.OpenThumbnailDatabase(path, create, hidden_) != ThumbnailDatabase::Opened::Done) return false;
+    if (database_.OpenThumbnailDatabase(path, create, hidden_) != ThumbnailDatabase::Opened::Done)
+      return false;
     openPath_ = path;
     return true;
   }
   // A database that cannot be written to costs the thumbnails no more than being made again.
   void Write() {
     const std::vector<DatabaseRecord> records = std::exchange(new_, {});
-    if (!records.empty() && Open(newPath_, true)) (void)database_.AppendDatabaseRecords(records, true);
+    if (!records.empty() && Open(newPath_, true))
+      (void)database_.AppendDatabaseRecords(records, true);
   }
 
   std::mutex mutex_;
@@ -97,12 +103,13 @@ bool FindRecord(const ThumbnailRequest& request, ThumbnailRecord& record) {
 Status ScaleDown(const PackedImage& image, int32_t side, RgbImage& pixels) {
   if (image.Width() <= side && image.Height() <= side) return ToRgb(image, pixels);
   PackedImage scaled, noAlpha, noScaledAlpha;
-  RETURN_IF_BAD(
-      ScaleFiltered(image, noAlpha, FitSize(image.Width(), image.Height(), side), ScaleFilter::Bicubic, scaled, noScaledAlpha));
+  RETURN_IF_BAD(ScaleFiltered(image, noAlpha, FitSize(image.Width(), image.Height(), side),
+                              ScaleFilter::Bicubic, scaled, noScaledAlpha));
   return ToRgb(scaled, pixels);
 }
 
-Status PixelsOfRecord(const ThumbnailRecord& record, const ThumbnailRequest& request, RgbImage& pixels) {
+Status PixelsOfRecord(const ThumbnailRecord& record, const ThumbnailRequest& request,
+                      RgbImage& pixels) {
   PackedImage bitmap;
   RETURN_IF_BAD(ThumbnailRecordToBitmap(record, bitmap));
   RETURN_IF_BAD(ToRgb(bitmap, pixels));
@@ -120,10 +127,13 @@ Status PixelsOfPicture(PictureRecord& picture, const ThumbnailRequest& request, 
 // A thumbnail that somebody has made before.
 bool ReadReady(const ThumbnailRequest& request, Thumbnail& thumbnail) {
   ThumbnailRecord record;
-  if (FindRecord(request, record) && PixelsOfRecord(record, request, thumbnail.pixels) == Status::Ok) return true;
-  const bool fromSystem =
-      request.mode == choice::kDiskBased && request.options.fromSystem && request.side > kSmallThumbnailSide;
-  const PicturePointer picture = fromSystem ? ReadSystemPicture(request.path, request.side) : nullptr;
+  if (FindRecord(request, record) &&
+      PixelsOfRecord(record, request, thumbnail.pixels) == Status::Ok)
+    return true;
+  const bool fromSystem = request.mode == choice::kDiskBased && request.options.fromSystem &&
+                          request.side > kSmallThumbnailSide;
+  const PicturePointer picture =
+      fromSystem ? ReadSystemPicture(request.path, request.side) : nullptr;
   return picture != nullptr && PixelsOfPicture(*picture, request, thumbnail.pixels) == Status::Ok;
 }
 
@@ -131,9 +141,12 @@ bool ReadReady(const ThumbnailRequest& request, Thumbnail& thumbnail) {
 bool ReadEmbedded(const ThumbnailRequest& request, Thumbnail& thumbnail) {
   ExifSource source;
   ExifFindings findings;
-  if (source.Open(request.path.c_str()) != Status::Ok || !WalkExif(source.Block(), nullptr, &findings)) return false;
+  if (source.Open(request.path.c_str()) != Status::Ok ||
+      !WalkExif(source.Block(), nullptr, &findings))
+    return false;
   PicturePointer picture;
-  if (DecodeExifThumbnail(ExifThumbnail(source.Block(), findings), picture) != Status::Ok) return false;
+  if (DecodeExifThumbnail(ExifThumbnail(source.Block(), findings), picture) != Status::Ok)
+    return false;
   picture->metadata.exif.assign(source.Block().begin(), source.Block().end());
   thumbnail.standIn = true;
   return PixelsOfPicture(*picture, request, thumbnail.pixels) == Status::Ok && source.Intact();
@@ -145,27 +158,33 @@ void CopyFacts(const PictureRecord& picture, Thumbnail& thumbnail) {
   thumbnail.bits = picture.bitsPerPixel;
   thumbnail.pages = picture.pageCount;
   thumbnail.alpha = (picture.alphaFlags & kHasAlpha) != 0;
-  thumbnail.animated = picture.pageCount > 1 && (FormatRow(picture.formatIndex).flags & FMT_ANIMATED) != 0;
+  thumbnail.animated =
+      picture.pageCount > 1 && (FormatRow(picture.formatIndex).flags & FMT_ANIMATED) != 0;
 }
 
-// What a record does not know of files that may have several pages: it is quickly told by their heads.
+// What a record does not know of files that may have several pages: it is quickly told by their
+// heads.
 void ReadPages(const std::string& path, const ReadOptions& options, Thumbnail& thumbnail) {
   const int32_t format = FindFormatByName(path);
   PicturePointer picture;
-  if (format == kNoFormat || format == kSpareRow || (FormatRow(format).flags & FMT_MULTI) == 0) return;
-  if (LoadPictureInfo({.fileName = path, .options = options}, picture) == Status::Ok) CopyFacts(*picture, thumbnail);
+  if (format == kNoFormat || format == kSpareRow || (FormatRow(format).flags & FMT_MULTI) == 0)
+    return;
+  if (LoadPictureInfo({.fileName = path, .options = options}, picture) == Status::Ok)
+    CopyFacts(*picture, thumbnail);
 }
 
 Status MakeFromPicture(const ThumbnailRequest& request, Thumbnail& thumbnail) {
   PicturePointer picture;
-  const ReadRequest read{.fileName = request.path, .thumbnailSide = request.side, .options = request.options.read};
+  const ReadRequest read{
+      .fileName = request.path, .thumbnailSide = request.side, .options = request.options.read};
   RETURN_IF_BAD(LoadPictureInfo(read, picture));
   CopyFacts(*picture, thumbnail);
   RETURN_IF_BAD(ReadPicture(read, *picture));
   thumbnail.alpha = !picture->alpha.Empty();
   RETURN_IF_BAD(PrepareForDisplay(*picture, request.options.matte));
   ThumbnailRecord record;
-  if (InDatabase(request) && request.options.keep && MakeThumbnailRecord(record, *picture, request.options))
+  if (InDatabase(request) && request.options.keep &&
+      MakeThumbnailRecord(record, *picture, request.options))
     openDatabase.Add(request, record);
   return ScaleDown(picture->image, request.side, thumbnail.pixels);
 }
@@ -184,14 +203,17 @@ ThumbnailPointer LoadThumbnail(const ThumbnailRequest& request) {
   return thumbnail;
 }
 
-bool MayHoldThumbnail(int32_t format) { return format != kNoFormat && FormatRow(format).keepsMetadata != 0; }
+bool MayHoldThumbnail(int32_t format) {
+  return format != kNoFormat && FormatRow(format).keepsMetadata != 0;
+}
 
 void KeepThumbnailRecords() { openDatabase.Flush(); }
 
 void DropThumbnails(const std::string& path) {
   const std::string file = ThumbnailPathFor(path);
   ThumbnailRecord record;
-  if (!platform::FactsOf(file).link && ReadThumbnailFile(record, file)) (void)platform::DeleteFile(file);
+  if (!platform::FactsOf(file).link && ReadThumbnailFile(record, file))
+    (void)platform::DeleteFile(file);
   openDatabase.Drop(path, ThumbnailDatabasePath({}));
   openDatabase.Drop(path, ThumbnailDatabasePath(platform::FolderOf(path)));
 }
@@ -199,7 +221,9 @@ void DropThumbnails(const std::string& path) {
 Status WriteThumbnail(const std::string& path, const ThumbnailOptions& options) {
   ThumbnailRecord record;
   RETURN_IF_BAD(MakeThumbnailOfFile(path, options, record));
-  return WriteThumbnailFile(record, ThumbnailPathFor(path), options.hidden) ? Status::Ok : Status::ErrorCreatingFile;
+  return WriteThumbnailFile(record, ThumbnailPathFor(path), options.hidden)
+             ? Status::Ok
+             : Status::ErrorCreatingFile;
 }
 
 }  // namespace fotomill::desktop

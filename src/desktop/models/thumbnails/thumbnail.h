@@ -10,7 +10,8 @@
 
 namespace fotomill::desktop {
 
-// What a thumbnail is wanted for. The file's time and size are part of it: a changed file is another one.
+// What a thumbnail is wanted for. The file's time and size are part of it: a changed file is
+// another one.
 struct ThumbnailRequest {
   std::string path;
   int64_t modified = 0;
@@ -30,27 +31,30 @@ struct Thumbnail {
   int32_t width = 0, height = 0, bits = 0, pages = 1;  // of the picture, 0 when it was not opened
   bool alpha = false;
   bool animated = false;  // the pages are frames that follow each other
-  bool standIn = false;   // the thumbnail that the file itself holds, which nobody has compared with the picture
+  // the thumbnail that the file itself holds, which nobody has compared with the picture
+  bool standIn = false;
 
   uint64_t Bytes() const { return sizeof *this + pixels.bytes.size(); }  // what it takes in a cache
 };
 // Shared by cache and windows; never changes.
 using ThumbnailPointer = std::shared_ptr<const Thumbnail>;
 
-// Gets a picture's thumbnail: a record from its thumbnail file or the database of the browser's mode when that is as new as the
-// picture and large enough, the system's own where large ones may come from there, else from the picture itself. Takes as long
-// as it takes; called by workers. A request for a stand-in decodes no picture: it gets the proper thumbnail when there is one
-// ready, else the one that the file holds, and null when it holds none.
+// Gets a picture's thumbnail: a record from its thumbnail file or the database of the browser's
+// mode when that is as new as the picture and large enough, the system's own where large ones may
+// come from there, else from the picture itself. Takes as long as it takes; called by workers. A
+// request for a stand-in decodes no picture: it gets the proper thumbnail when there is one ready,
+// else the one that the file holds, and null when it holds none.
 ThumbnailPointer LoadThumbnail(const ThumbnailRequest& request);
 
 // Whether files of a row of the registry can hold a thumbnail of their own.
 bool MayHoldThumbnail(int32_t format);
 
-// Writes the records that were made for databases since the last call; LoadThumbnail does it as well, now and then.
+// Writes the records that were made for databases since the last call; LoadThumbnail does it as
+// well, now and then.
 void KeepThumbnailRecords();
 
-// Deletes a picture's thumbnail file and its records in the global and the folder's database: the picture is about to be replaced
-// by a file that may be older.
+// Deletes a picture's thumbnail file and its records in the global and the folder's database: the
+// picture is about to be replaced by a file that may be older.
 void DropThumbnails(const std::string& path);
 
 // Makes a picture's thumbnail record and writes its thumbnail file.

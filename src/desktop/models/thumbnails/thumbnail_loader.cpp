@@ -7,13 +7,19 @@
 
 namespace fotomill::desktop {
 
-ThumbnailLoader::ThumbnailLoader(unsigned atOnce, std::function<void()> wake, Load load, void (*idle)())
-    : wake_(std::move(wake)), load_(load), idle_(idle), work_(Lane::Compute, atOnce, [this] { return Next(); }) {}
+ThumbnailLoader::ThumbnailLoader(unsigned atOnce, std::function<void()> wake, Load load,
+                                 void (*idle)())
+    : wake_(std::move(wake)),
+      load_(load),
+      idle_(idle),
+      work_(Lane::Compute, atOnce, [this] { return Next(); }) {}
 
 void ThumbnailLoader::Want(std::vector<ThumbnailRequest> requests) {
   {
     const std::lock_guard lock(mutex_);
-    std::erase_if(requests, [this](const ThumbnailRequest& request) { return std::ranges::find(inWork_, request) != inWork_.end(); });
+    std::erase_if(requests, [this](const ThumbnailRequest& request) {
+      return std::ranges::find(inWork_, request) != inWork_.end();
+    });
     std::reverse(requests.begin(), requests.end());
     requests_ = std::move(requests);
   }

@@ -13,9 +13,9 @@
 
 namespace fotomill::desktop {
 
-// Loads thumbnails on threads of the pool, in the order in which they are wanted now. The request of a result tells whether it is a
-// stand-in; its thumbnail is null when there is none. Where a stand-in was wanted and the proper one was ready, nobody loads it
-// again.
+// Loads thumbnails on threads of the pool, in the order in which they are wanted now. The request
+// of a result tells whether it is a stand-in; its thumbnail is null when there is none. Where a
+// stand-in was wanted and the proper one was ready, nobody loads it again.
 class ThumbnailLoader {
  public:
   // A request that was dealt with.
@@ -25,15 +25,17 @@ class ThumbnailLoader {
   };
   using Load = ThumbnailPointer (*)(const ThumbnailRequest& request);
 
-  // `wake` is called on a worker when results wait that nobody was told of yet, `idle` on the worker that has done the last
-  // request.
-  ThumbnailLoader(unsigned atOnce, std::function<void()> wake, Load load = LoadThumbnail, void (*idle)() = KeepThumbnailRecords);
+  // `wake` is called on a worker when results wait that nobody was told of yet, `idle` on the
+  // worker that has done the last request.
+  ThumbnailLoader(unsigned atOnce, std::function<void()> wake, Load load = LoadThumbnail,
+                  void (*idle)() = KeepThumbnailRecords);
   // Waits for what is in work.
   ~ThumbnailLoader() = default;
   ThumbnailLoader(const ThumbnailLoader&) = delete;
   ThumbnailLoader& operator=(const ThumbnailLoader&) = delete;
 
-  // Sets the wanted thumbnails, most urgent first. Pending requests are replaced; running ones finish.
+  // Sets the wanted thumbnails, most urgent first. Pending requests are replaced; running ones
+  // finish.
   void Want(std::vector<ThumbnailRequest> requests);
   std::vector<Result> FetchResults();  // those that came since the last call
   // Thumbnails that wait or are in progress.
@@ -62,7 +64,8 @@ class ThumbnailCache {
   explicit ThumbnailCache(uint64_t capacity) : capacity_(capacity) {}  // bytes
   // Null when it is not there, or is there for another state of the file, or another side.
   ThumbnailPointer Find(const ThumbnailRequest& request);
-  // The thumbnail of a path in whatever state and size there is: something to show until the right one comes.
+  // The thumbnail of a path in whatever state and size there is: something to show until the right
+  // one comes.
   ThumbnailPointer FindAny(const std::string& path) const;
   void Put(const ThumbnailRequest& request, ThumbnailPointer thumbnail);
   void Clear();

@@ -51,7 +51,8 @@ std::shared_ptr<ThumbnailOffer> ThumbnailOffer::Start(ThumbnailBrowser browser, 
   auto offer = std::make_shared<ThumbnailOffer>();
   offer->events_ = std::move(events);
   (void)RunLoose([offer, browser = std::move(browser)] {
-    if (Guarded([&] { offer->Run(browser); }) != Status::Ok && !offer->stop_) offer->events_.ended(true, browser);
+    if (Guarded([&] { offer->Run(browser); }) != Status::Ok && !offer->stop_)
+      offer->events_.ended(true, browser);
   });
   return offer;
 }

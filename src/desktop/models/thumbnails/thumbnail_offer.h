@@ -12,14 +12,15 @@
 
 namespace fotomill::desktop {
 
-// The offer to make missing thumbnail files of one folder, apart: it looks for them, asks, waits for the answer as long as it
-// takes, and makes them on all cores that nobody else wants.
+// The offer to make missing thumbnail files of one folder, apart: it looks for them, asks, waits
+// for the answer as long as it takes, and makes them on all cores that nobody else wants.
 class ThumbnailOffer : public std::enable_shared_from_this<ThumbnailOffer> {
  public:
   // Called apart.
   struct Events {
     std::function<void(int32_t count, int32_t selected)> ask;
-    std::function<void(const ThumbnailUpdateOptions& options)> keep;  // the choice, for later offers
+    // the choice, for later offers
+    std::function<void(const ThumbnailUpdateOptions& options)> keep;
     std::function<void(size_t done, size_t total)> building;
     std::function<void(bool changed, const ThumbnailBrowser& browser)> ended;
   };

@@ -25,31 +25,44 @@ std::string OutcomeText(Compacted result, int32_t before, int32_t after, uint64_
   switch (result) {
     case Compacted::Done:
       if (before == after) {
-        return TrCount("Nothing to remove: the only record is in use.", "Nothing to remove: all %1 records are in use.",
+        return TrCount("Nothing to remove: the only record is in use.",
+                       "Nothing to remove: all %1 records are in use.",
                        static_cast<uint64_t>(after));
       }
       return TrCount("%1 record was removed, %2 remain. The file is %3 smaller.",
-                     "%1 records were removed, %2 remain. The file is %3 smaller.", static_cast<uint64_t>(before - after),
-                     ThousandsText(static_cast<uint64_t>(after)), SizeText(saved, choice::kSizeFitting));
+                     "%1 records were removed, %2 remain. The file is %3 smaller.",
+                     static_cast<uint64_t>(before - after),
+                     ThousandsText(static_cast<uint64_t>(after)),
+                     SizeText(saved, choice::kSizeFitting));
     case Compacted::Stopped: return std::string(Tr("Stopped.")).append(" ").append(Tr(kUnchanged));
-    case Compacted::NotRead: return Tr(StatusMessage(Status::FileReadError)).append(" ").append(Tr(kUnchanged));
+    case Compacted::NotRead:
+      return Tr(StatusMessage(Status::FileReadError)).append(" ").append(Tr(kUnchanged));
     case Compacted::Failed: break;
   }
-  return Tr(StatusMessage(Status::ErrorWritingFile)).append(" ").append(Tr(kUnchanged)).append(" ").append(
-      Tr("The disk may be full, or the folder write-protected."));
+  return Tr(StatusMessage(Status::ErrorWritingFile))
+      .append(" ")
+      .append(Tr(kUnchanged))
+      .append(" ")
+      .append(Tr("The disk may be full, or the folder write-protected."));
 }
 
-void CollectOrphans(const std::string& folder, int depth, const StopToken& stop, std::vector<std::string>& orphans) {
+void CollectOrphans(const std::string& folder, int depth, const StopToken& stop,
+                    std::vector<std::string>& orphans) {
   const auto entries = platform::ListFolder(folder);
-  if (!entries || stop.Asked() || platform::VolumeOf(folder).kind == platform::DriveKind::Optical) return;
+  if (!entries || stop.Asked() || platform::VolumeOf(folder).kind == platform::DriveKind::Optical)
+    return;
   std::vector<std::string> pictures;
   for (const platform::FolderEntry& entry : *entries) {
-    if (entry.kind == platform::FileKind::Regular && FindFormatByName(entry.name) != kNoFormat) pictures.push_back(entry.name);
+    if (entry.kind == platform::FileKind::Regular && FindFormatByName(entry.name) != kNoFormat)
+      pictures.push_back(entry.name);
   }
-  if (const auto found = OrphanThumbnails(folder, pictures)) orphans.insert(orphans.end(), found->begin(), found->end());
+  if (const auto found = OrphanThumbnails(folder, pictures))
+    orphans.insert(orphans.end(), found->begin(), found->end());
   for (const platform::FolderEntry& entry : *entries) {
-    const bool goDown = depth > 0 && entry.kind == platform::FileKind::Folder && !entry.link && !entry.name.starts_with('.');
-    if (goDown && !stop.Asked()) CollectOrphans(platform::JoinFolder(folder, entry.name), depth - 1, stop, orphans);
+    const bool goDown = depth > 0 && entry.kind == platform::FileKind::Folder && !entry.link &&
+                        !entry.name.starts_with('.');
+    if (goDown && !stop.Asked())
+      CollectOrphans(platform::JoinFolder(folder, entry.name), depth - 1, stop, orphans);
   }
 }
 
@@ -78,8 +91,10 @@ void DatabaseCompaction::Step(int32_t done, int32_t total) {
 void DatabaseCompaction::Run(bool purge, const StopToken& stop) {
   ThumbnailDatabase database;
   DatabaseHeader before, after;
-  if (database.OpenThumbnailDatabase(path_, false, hidden_) != Opened::Done || !database.ReadDatabaseHeader(before)) {
-    outcome_ = platform::FileExists(path_) ? Tr(kNoDatabase) : Tr("This thumbnail database does not exist.");
+  if (database.OpenThumbnailDatabase(path_, false, hidden_) != Opened::Done ||
+      !database.ReadDatabaseHeader(before)) {
+    outcome_ = platform::FileExists(path_) ? Tr(kNoDatabase)
+                                           : Tr("This thumbnail database does not exist.");
   } else {
     const uint64_t size = platform::FactsOf(path_).size;
     const Compacted result = database.CompactThumbnailDatabase(purge, this, stop);
@@ -94,12 +109,16 @@ std::string DescribeDatabase(const std::string& path) {
   if (!platform::FileExists(path)) return Tr("It does not exist yet.");
   ThumbnailDatabase database;
   DatabaseHeader header;
-  if (database.OpenThumbnailDatabase(path, false) != Opened::Done || !database.ReadDatabaseHeader(header)) return Tr(kNoDatabase);
-  return TrCount("%1 record, %2", "%1 records, %2", static_cast<uint64_t>(std::max(header.count, 0)),
+  if (database.OpenThumbnailDatabase(path, false) != Opened::Done ||
+      !database.ReadDatabaseHeader(header))
+    return Tr(kNoDatabase);
+  return TrCount("%1 record, %2", "%1 records, %2",
+                 static_cast<uint64_t>(std::max(header.count, 0)),
                  SizeText(platform::FactsOf(path).size, choice::kSizeFitting));
 }
 
-std::vector<std::string> FindOrphanThumbnails(const std::string& folder, bool below, const StopToken& stop) {
+std::vector<std::string> FindOrphanThumbnails(const std::string& folder, bool below,
+                                              const StopToken& stop) {
   std::vector<std::string> orphans;
   CollectOrphans(folder, below ? kDeepest : 0, stop, orphans);
   return orphans;

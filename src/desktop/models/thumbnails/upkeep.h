@@ -11,7 +11,8 @@
 
 namespace fotomill::desktop {
 
-// Compaction of one thumbnail database on a thread of its own, for a window that shows how far it is.
+// Compaction of one thumbnail database on a thread of its own, for a window that shows how far it
+// is.
 class DatabaseCompaction : private ProgressSink {
  public:
   // Begins at once; `purge` drops the thumbnails of missing pictures as well; with `hidden` the
@@ -48,9 +49,11 @@ class DatabaseCompaction : private ProgressSink {
 // "1,234 records, 35.1 MB", or why there is nothing to compact.
 std::string DescribeDatabase(const std::string& path);
 
-// Thumbnail files of a folder, and with `below` of the folders below it, whose pictures are gone. Folders on optical drives
-// and those that cannot be read give none. Ends early when `stop` is asked.
-std::vector<std::string> FindOrphanThumbnails(const std::string& folder, bool below, const StopToken& stop);
+// Thumbnail files of a folder, and with `below` of the folders below it, whose pictures are gone.
+// Folders on optical drives and those that cannot be read give none. Ends early when `stop` is
+// asked.
+std::vector<std::string> FindOrphanThumbnails(const std::string& folder, bool below,
+                                              const StopToken& stop);
 // Deletes them; those that could not be deleted come back.
 std::vector<std::string> DeleteThumbnails(const std::vector<std::string>& files);
 

@@ -10,7 +10,8 @@ namespace fotomill::desktop {
 
 namespace {
 
-// A larger canvas is not played: beside it a copy, the frame that is made of that and the one on the screen must be held.
+// A larger canvas is not played: beside it a copy, the frame that is made of that and the one on
+// the screen must be held.
 constexpr uint64_t kMostCanvasBytes = uint64_t{256} << 20;
 
 // A record of its own for the frame that the animation has on its canvas.
@@ -37,7 +38,10 @@ Status CopyFrame(const PictureRecord& facts, const Canvas& canvas, PicturePointe
 }  // namespace
 
 AnimationFrames::AnimationFrames(ViewRequest request, uint64_t capacity, std::function<void()> wake)
-    : capacity_(capacity), wake_(std::move(wake)), request_(std::move(request)), work_(Lane::Urgent, 1, [this] { return Next(); }) {
+    : capacity_(capacity),
+      wake_(std::move(wake)),
+      request_(std::move(request)),
+      work_(Lane::Urgent, 1, [this] { return Next(); }) {
   work_.Look();
 }
 
@@ -111,8 +115,8 @@ bool AnimationFrames::IsFitted(size_t frame) const {
   return request.fitWidth == request_.fitWidth && request.fitHeight == request_.fitHeight;
 }
 
-// What is to be decoded next: in the order of playing the first frame that is missing; then, where all are kept, the first one
-// that was made for another window.
+// What is to be decoded next: in the order of playing the first frame that is missing; then, where
+// all are kept, the first one that was made for another window.
 bool AnimationFrames::NextFrame(size_t& frame) const {
   const size_t count = frames_.size();
   const auto first = [&](auto isWanted) {
@@ -122,18 +126,20 @@ bool AnimationFrames::NextFrame(size_t& frame) const {
     }
     return false;
   };
-  if (first([&](size_t i) { return frames_[i] == nullptr && (Keeps(i) || i == shown_); })) return true;
+  if (first([&](size_t i) { return frames_[i] == nullptr && (Keeps(i) || i == shown_); }))
+    return true;
   return Room() == count && first([&](size_t i) { return !IsFitted(i); });
 }
 
 Status AnimationFrames::OpenFile() {
   RETURN_IF_BAD(LoadPictureInfo({.fileName = request_.path, .options = request_.read}, facts_));
-  if (EstimateImageBytes(facts_->width, facts_->height, 32) > kMostCanvasBytes) return Status::MemoryAllocationError;
+  if (EstimateImageBytes(facts_->width, facts_->height, 32) > kMostCanvasBytes)
+    return Status::MemoryAllocationError;
   return OpenAnimation({.fileName = request_.path, .options = request_.read}, animation_);
 }
 
-// Composes frames from `position_`, the next one of the animation, up to the wanted one. Null when it cannot be had; the frames
-// then end at `position_`.
+// Composes frames from `position_`, the next one of the animation, up to the wanted one. Null when
+// it cannot be had; the frames then end at `position_`.
 ViewPicturePointer AnimationFrames::Decode(size_t frame) {
   ViewRequest request;
   if (frame < position_) {

@@ -12,28 +12,32 @@
 
 namespace fotomill::desktop {
 
-// Decodes the frames of an animation apart. All of them are kept when they fit into a number of bytes; else
-// as many around the one that is shown as do, and they are decoded again in each round.
+// Decodes the frames of an animation apart. All of them are kept when they fit into a number of
+// bytes; else as many around the one that is shown as do, and they are decoded again in each round.
 class AnimationFrames {
  public:
-  // `wake` is called on a thread of the pool whenever the file was opened, a frame came or one could not be decoded.
+  // `wake` is called on a thread of the pool whenever the file was opened, a frame came or one
+  // could not be decoded.
   AnimationFrames(ViewRequest request, uint64_t capacity, std::function<void()> wake);
   ~AnimationFrames();
   AnimationFrames(const AnimationFrames&) = delete;
   AnimationFrames& operator=(const AnimationFrames&) = delete;
 
-  // How many frames there are, 0 until the file was opened. Less than the file says when one of them cannot be decoded.
+  // How many frames there are, 0 until the file was opened. Less than the file says when one of
+  // them cannot be decoded.
   size_t Count() const;
   // Why there are no frames, or none behind the last one; Ok otherwise.
   Status Failure() const;
   int32_t DelayMs(size_t frame) const;  // that it is shown; 0 for one that is not there
   int32_t Rounds() const;               // 0 for ever
 
-  // This frame is on the screen and those behind it are wanted next. At first that is the first one.
+  // This frame is on the screen and those behind it are wanted next. At first that is the first
+  // one.
   void Want(size_t frame);
   // A frame if it is decoded, fitted to whatever window.
   ViewPicturePointer Find(size_t frame) const;
-  // From here on frames are made for a window of this size; those that stay in memory are made again.
+  // From here on frames are made for a window of this size; those that stay in memory are made
+  // again.
   void Fit(int32_t width, int32_t height);
 
  private:

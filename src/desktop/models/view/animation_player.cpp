@@ -18,11 +18,13 @@ void AnimationPlayer::Step(int32_t frames) {
   playing_ = false;
   if (HasEnded()) round_ = 0;
   const auto count = static_cast<int64_t>(Count());
-  if (count > 0) frame_ = static_cast<size_t>(((static_cast<int64_t>(frame_) + frames) % count + count) % count);
+  if (count > 0)
+    frame_ = static_cast<size_t>(((static_cast<int64_t>(frame_) + frames) % count + count) % count);
 }
 
 ViewPicturePointer AnimationPlayer::At(double now) {
-  if (const size_t count = Count(); count > 0 && frame_ >= count) frame_ = count - 1;  // fewer than the file said
+  // fewer than the file said
+  if (const size_t count = Count(); count > 0 && frame_ >= count) frame_ = count - 1;
   if (playing_ && due_ != kNotBegun && now >= due_) MoveOn(now);
   frames_.Want(frame_);
   ViewPicturePointer picture = frames_.Find(frame_);
@@ -30,7 +32,8 @@ ViewPicturePointer AnimationPlayer::At(double now) {
   return picture;
 }
 
-// Moves to the next frame, if it is decoded. A frame more than its duration late is still shown in full.
+// Moves to the next frame, if it is decoded. A frame more than its duration late is still shown in
+// full.
 void AnimationPlayer::MoveOn(double now) {
   if (AtTheEnd()) playedOnce_ = true;
   if (IsLast()) {

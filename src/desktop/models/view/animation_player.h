@@ -7,8 +7,8 @@
 
 namespace fotomill::desktop {
 
-// Plays an animation. Times are seconds of a clock that its holder keeps; every frame is shown, so that an animation that cannot
-// be decoded in time goes slower. Used by one thread.
+// Plays an animation. Times are seconds of a clock that its holder keeps; every frame is shown, so
+// that an animation that cannot be decoded in time goes slower. Used by one thread.
 class AnimationPlayer {
  public:
   // `wake` as of AnimationFrames: At is to be asked again.
@@ -23,9 +23,11 @@ class AnimationPlayer {
   void Step(int32_t frames);
   void Fit(int32_t width, int32_t height) { frames_.Fit(width, height); }
 
-  // What is to be shown at this time; null while that is not decoded yet. Asked too early it is the frame shown already.
+  // What is to be shown at this time; null while that is not decoded yet. Asked too early it is the
+  // frame shown already.
   ViewPicturePointer At(double now);
-  // Seconds until At moves on; negative when it never does by itself: paused, at the end, or waiting for a frame.
+  // Seconds until At moves on; negative when it never does by itself: paused, at the end, or
+  // waiting for a frame.
   double SecondsLeft(double now) const;
 
   // The frame that is shown, from 0, of how many are known so far; why decoding ended, Ok while it

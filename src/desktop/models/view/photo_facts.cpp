@@ -13,11 +13,13 @@ namespace fotomill::desktop {
 namespace {
 
 // Source: CIPA DC-008-2012, sections 4.6.4 to 4.6.6.
-constexpr uint16_t kMake = 0x010f, kModel = 0x0110, kChanged = 0x0132, kExposure = 0x829a, kFNumber = 0x829d, kIso = 0x8827,
-                   kTaken = 0x9003, kFocalLength = 0x920a, kLensMake = 0xa433, kLens = 0xa434;
+constexpr uint16_t kMake = 0x010f, kModel = 0x0110, kChanged = 0x0132, kExposure = 0x829a,
+                   kFNumber = 0x829d, kIso = 0x8827, kTaken = 0x9003, kFocalLength = 0x920a,
+                   kLensMake = 0xa433, kLens = 0xa434;
 constexpr double kLongestFraction = 0.3;  // seconds; longer exposures are told as decimals
 
-// The texts and first numbers of a walk; of a tag that stands in several directories, the first that has a value.
+// The texts and first numbers of a walk; of a tag that stands in several directories, the first
+// that has a value.
 class Values : public ExifSink {
  public:
   void Directory(int32_t, std::string_view) override {}
@@ -46,7 +48,9 @@ class Values : public ExifSink {
     if (value.type == kExifShort) return value.bytes.U16(0);
     if (value.type == kExifLong) return value.bytes.U32(0);
     const uint32_t divisor = value.bytes.U32(4);
-    return value.type == kExifRational && divisor != 0 ? static_cast<double>(value.bytes.U32(0)) / divisor : 0;
+    return value.type == kExifRational && divisor != 0
+               ? static_cast<double>(value.bytes.U32(0)) / divisor
+               : 0;
   }
 
   std::map<uint16_t, std::string> texts_;
@@ -62,7 +66,9 @@ std::string Printed(const char* format, double number) {
 // Makers like to be in front of their models' names as well.
 std::string Named(const std::string& make, const std::string& model) {
   const std::string_view firstWord = std::string_view(make).substr(0, make.find(' '));
-  return make.empty() || model.starts_with(firstWord) ? model : model.empty() ? make : make + " " + model;
+  return make.empty() || model.starts_with(firstWord) ? model
+         : model.empty()                              ? make
+                                                      : make + " " + model;
 }
 
 std::string ExposureLine(const Values& values) {
@@ -71,7 +77,8 @@ std::string ExposureLine(const Values& values) {
     if (values.Number(tag) > 0) line.append(line.empty() ? "" : "   ").append(text);
   };
   const double seconds = values.Number(kExposure);
-  add(kExposure, seconds > kLongestFraction ? Printed("%.3g s", seconds) : Printed("1/%.0f s", 1 / seconds));
+  add(kExposure,
+      seconds > kLongestFraction ? Printed("%.3g s", seconds) : Printed("1/%.0f s", 1 / seconds));
   add(kFNumber, Printed("f/%.3g", values.Number(kFNumber)));
   add(kIso, Printed("ISO %.0f", values.Number(kIso)));
   add(kFocalLength, Printed("%.4g mm", values.Number(kFocalLength)));
@@ -93,7 +100,8 @@ std::vector<std::string> PhotoFacts(std::span<const uint8_t> exif) {
   Values values;
   if (exif.empty() || !WalkExif(exif, &values)) return {};
   std::vector<std::string> lines = {Named(values.Text(kMake), values.Text(kModel)),
-                                    Named(values.Text(kLensMake), values.Text(kLens)), ExposureLine(values), DateLine(values)};
+                                    Named(values.Text(kLensMake), values.Text(kLens)),
+                                    ExposureLine(values), DateLine(values)};
   std::erase_if(lines, [](const std::string& line) { return line.empty(); });
   return lines;
 }

@@ -18,7 +18,8 @@ namespace {
 constexpr const char* kFile = "FMWSlideshow.txt";
 constexpr const char* kSection = "Slideshow";
 
-int32_t NumberOf(std::string_view text, std::string_view key, int32_t least, int32_t most, int32_t otherwise) {
+int32_t NumberOf(std::string_view text, std::string_view key, int32_t least, int32_t most,
+                 int32_t otherwise) {
   const auto value = FindIniValue(text, kSection, key);
   const auto number = value ? ParseNumber(*value) : std::nullopt;
   return number && *number >= least && *number <= most ? *number : otherwise;
@@ -32,14 +33,18 @@ SlideshowChoices LoadSlideshowChoices() {
   if (!path.empty()) (void)platform::ReadWholeFile(path, limits.listFileBytes, text);
   const SlideshowChoices first;
   return {NumberOf(text, "Seconds", 1, SlideshowChoices::kMostSeconds, first.seconds),
-          NumberOf(text, "Random", 0, 1, first.random ? 1 : 0) != 0, NumberOf(text, "Repeat", 0, 1, first.repeat ? 1 : 0) != 0};
+          NumberOf(text, "Random", 0, 1, first.random ? 1 : 0) != 0,
+          NumberOf(text, "Repeat", 0, 1, first.repeat ? 1 : 0) != 0};
 }
 
 bool SaveSlideshowChoices(const SlideshowChoices& choices) {
   const std::string seconds = std::to_string(choices.seconds);
-  const IniEdit edits[] = {{"Seconds", seconds}, {"Random", choices.random ? "1" : "0"}, {"Repeat", choices.repeat ? "1" : "0"}};
+  const IniEdit edits[] = {{"Seconds", seconds},
+                           {"Random", choices.random ? "1" : "0"},
+                           {"Repeat", choices.repeat ? "1" : "0"}};
   const EditResult result =
-      EditTextFile(DataFile(kFile), limits.listFileBytes, [&](std::string& text) { text = EditIni(text, kSection, edits); });
+      EditTextFile(DataFile(kFile), limits.listFileBytes,
+                   [&](std::string& text) { text = EditIni(text, kSection, edits); });
   return result == EditResult::Done || result == EditResult::Unchanged;
 }
 
@@ -72,7 +77,9 @@ std::optional<size_t> Slideshow::Next(size_t place, size_t count) {
   if (!choices_.repeat) return {};
   BeginRound(place, count);
   // The new round begins with another place than the one that is shown, which comes anywhere in it.
-  if (count > 1) std::iter_swap(order_.begin(), order_.begin() + static_cast<std::ptrdiff_t>(1 + random_() % (count - 1)));
+  if (count > 1)
+    std::iter_swap(order_.begin(),
+                   order_.begin() + static_cast<std::ptrdiff_t>(1 + random_() % (count - 1)));
   return order_.front();
 }
 

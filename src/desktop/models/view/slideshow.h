@@ -19,8 +19,8 @@ struct SlideshowChoices {
   bool operator==(const SlideshowChoices&) const = default;
 };
 
-// The choices of the last time, kept in the data folder in the file "FMWSlideshow.txt": Seconds, Random and Repeat in the section
-// [Slideshow]. What is not there or makes no sense is as at first.
+// The choices of the last time, kept in the data folder in the file "FMWSlideshow.txt": Seconds,
+// Random and Repeat in the section [Slideshow]. What is not there or makes no sense is as at first.
 SlideshowChoices LoadSlideshowChoices();
 // False when they could not be written.
 [[nodiscard]] bool SaveSlideshowChoices(const SlideshowChoices& choices);
@@ -31,8 +31,9 @@ class Slideshow {
   // Begins at `place` of a list of `count`; equal seeds give equal orders.
   Slideshow(const SlideshowChoices& choices, size_t count, size_t place, uint32_t seed);
 
-  // The place that comes after `place`, which is shown; none at the end. In random order every place comes once in a round, and
-  // none twice in a row. A list of another length begins a new round.
+  // The place that comes after `place`, which is shown; none at the end. In random order every
+  // place comes once in a round, and none twice in a row. A list of another length begins a new
+  // round.
   std::optional<size_t> Next(size_t place, size_t count);
   // The place that comes next, as far as that is no matter of the list's order.
   std::optional<size_t> Upcoming() const;

@@ -21,7 +21,8 @@ Positions PositionsOf(int32_t first, int32_t count, int32_t shown, int32_t size,
   const double last = size - (between ? 1.0 : 1.0 / 65536);
   for (int32_t i = 0; i < count; ++i) {
     const double position = (first + i + 0.5) * step - (between ? 0.5 : 0);
-    positions[static_cast<size_t>(i)] = static_cast<int64_t>(std::clamp(position, 0.0, last) * 65536);
+    positions[static_cast<size_t>(i)] =
+        static_cast<int64_t>(std::clamp(position, 0.0, last) * 65536);
   }
   return positions;
 }
@@ -47,7 +48,8 @@ struct ColumnPair {
         u(static_cast<int32_t>(column & 0xffff) >> 8) {}
 };
 
-// A line between two rows of bytes, as 256 times the values, for the columns that positions need. Whole rows are quick to blend.
+// A line between two rows of bytes, as 256 times the values, for the columns that positions need.
+// Whole rows are quick to blend.
 class LineBetween {
  public:
   void Set(const RowPair& rows, const Positions& columns, int32_t width, int32_t channels) {
@@ -56,7 +58,8 @@ class LineBetween {
     const int32_t end = channels * std::min(static_cast<int32_t>(columns.back() >> 16) + 2, width);
     sums_.resize(static_cast<size_t>(end - first_));
     for (int32_t i = first_; i < end; ++i) {
-      sums_[static_cast<size_t>(i - first_)] = static_cast<uint16_t>(rows.upper[i] * (256 - rows.v) + rows.lower[i] * rows.v);
+      sums_[static_cast<size_t>(i - first_)] =
+          static_cast<uint16_t>(rows.upper[i] * (256 - rows.v) + rows.lower[i] * rows.v);
     }
   }
   const uint16_t* At(int32_t column) const { return sums_.data() + (channels_ * column - first_); }
@@ -69,16 +72,20 @@ class LineBetween {
 inline uint8_t* DrawPixelBetween(const LineBetween& line, const ColumnPair& at, uint8_t* rgb) {
   const uint16_t *left = line.At(at.left), *right = line.At(at.right);
   for (int channel = 2; channel >= 0; --channel) {
-    *rgb++ = static_cast<uint8_t>((left[channel] * (256 - at.u) + right[channel] * at.u + 32768) >> 16);
+    *rgb++ =
+        static_cast<uint8_t>((left[channel] * (256 - at.u) + right[channel] * at.u + 32768) >> 16);
   }
   return rgb;
 }
 
-// The same of pixels with alpha: each color counts by its alpha, so that what is transparent gives none away.
-uint8_t* BlendPixelBetween(const RowPair& rows, const RowPair& alphas, const ColumnPair& at, const uint8_t* behind,
-                           uint8_t* rgb) {
+// The same of pixels with alpha: each color counts by its alpha, so that what is transparent gives
+// none away.
+uint8_t* BlendPixelBetween(const RowPair& rows, const RowPair& alphas, const ColumnPair& at,
+                           const uint8_t* behind, uint8_t* rgb) {
   constexpr uint32_t kWhole = 65536 * 255;  // the weight of what is opaque
-  const auto weight = [](int32_t across, int32_t down, uint8_t alpha) { return static_cast<uint32_t>(across * down * alpha); };
+  const auto weight = [](int32_t across, int32_t down, uint8_t alpha) {
+    return static_cast<uint32_t>(across * down * alpha);
+  };
   const uint32_t upperLeft = weight(256 - at.u, 256 - rows.v, alphas.upper[at.left]);
   const uint32_t upperRight = weight(at.u, 256 - rows.v, alphas.upper[at.right]);
   const uint32_t lowerLeft = weight(256 - at.u, rows.v, alphas.lower[at.left]);
@@ -86,8 +93,8 @@ uint8_t* BlendPixelBetween(const RowPair& rows, const RowPair& alphas, const Col
   const uint32_t through = kWhole - upperLeft - upperRight - lowerLeft - lowerRight;
   for (int32_t channel = 2; channel >= 0; --channel) {
     const int32_t left = 3 * at.left + channel, right = 3 * at.right + channel;
-    const uint32_t sum = upperLeft * rows.upper[left] + upperRight * rows.upper[right] + lowerLeft * rows.lower[left] +
-                         lowerRight * rows.lower[right];
+    const uint32_t sum = upperLeft * rows.upper[left] + upperRight * rows.upper[right] +
+                         lowerLeft * rows.lower[left] + lowerRight * rows.lower[right];
     *rgb++ = static_cast<uint8_t>((sum + through * *behind++ + kWhole / 2) / kWhole);
   }
   return rgb;
@@ -96,12 +103,14 @@ uint8_t* BlendPixelBetween(const RowPair& rows, const RowPair& alphas, const Col
 // Draws lines between four pixels each.
 class BetweenPixels {
  public:
-  BetweenPixels(const ViewSource& source, const Positions& columns) : source_(source), columns_(columns) {}
+  BetweenPixels(const ViewSource& source, const Positions& columns)
+      : source_(source), columns_(columns) {}
 
   void Draw(int64_t row, uint8_t* rgb) {
     const int32_t width = source_.image.Width();
     colors_.Set(RowPair(source_.image, row), columns_, width, 3);
-    for (const int64_t column : columns_) rgb = DrawPixelBetween(colors_, ColumnPair(column, width), rgb);
+    for (const int64_t column : columns_)
+      rgb = DrawPixelBetween(colors_, ColumnPair(column, width), rgb);
   }
 
   void Blend(int64_t row, const uint8_t* behind, uint8_t* rgb) {
@@ -137,21 +146,27 @@ void DrawNearest(const uint8_t* bgr, const Positions& columns, uint8_t* rgb) {
   }
 }
 
-void BlendNearest(const uint8_t* bgr, const uint8_t* alpha, const Positions& columns, const uint8_t* behind, uint8_t* rgb) {
+void BlendNearest(const uint8_t* bgr, const uint8_t* alpha, const Positions& columns,
+                  const uint8_t* behind, uint8_t* rgb) {
   for (const int64_t column : columns) {
     const uint8_t* pixel = bgr + 3 * (column >> 16);
-    for (int channel = 2; channel >= 0; --channel) *rgb++ = Blend(*behind++, pixel[channel], alpha[column >> 16]);
+    for (int channel = 2; channel >= 0; --channel)
+      *rgb++ = Blend(*behind++, pixel[channel], alpha[column >> 16]);
   }
 }
 
-// Two rows of what is behind a picture: of the lines whose squares begin with the one color, and with the other.
+// Two rows of what is behind a picture: of the lines whose squares begin with the one color, and
+// with the other.
 class RowsBehind {
  public:
-  RowsBehind(const Backdrop& backdrop, int32_t left, int32_t width) : side_(backdrop.squares ? backdrop.side : 1) {
+  RowsBehind(const Backdrop& backdrop, int32_t left, int32_t width)
+      : side_(backdrop.squares ? backdrop.side : 1) {
     for (int32_t phase = 0; phase < 2; ++phase) {
       for (int32_t x = left; x < left + width; ++x) {
-        const Color color = backdrop.squares ? backdrop.square[(x / side_ + phase) & 1] : backdrop.around;
-        for (int shift = 0; shift < 24; shift += 8) rows_[phase].push_back(static_cast<uint8_t>(color >> shift));
+        const Color color =
+            backdrop.squares ? backdrop.square[(x / side_ + phase) & 1] : backdrop.around;
+        for (int shift = 0; shift < 24; shift += 8)
+          rows_[phase].push_back(static_cast<uint8_t>(color >> shift));
       }
     }
   }
@@ -164,7 +179,8 @@ class RowsBehind {
 
 }  // namespace
 
-void DrawView(const ViewSource& source, const ViewTransform& transform, const Backdrop& backdrop, bool smooth, RgbImage& canvas) {
+void DrawView(const ViewSource& source, const ViewTransform& transform, const Backdrop& backdrop,
+              bool smooth, RgbImage& canvas) {
   const PackedImage& image = source.image;
   const int32_t x = transform.X(), y = transform.Y();
   const int32_t left = std::max(x, 0), right = std::min(x + transform.ShownWidth(), canvas.width);
@@ -172,12 +188,16 @@ void DrawView(const ViewSource& source, const ViewTransform& transform, const Ba
   if (left > 0 || top > 0 || right < canvas.width || bottom < canvas.height) {
     canvas = FilledImage(canvas.width, canvas.height, backdrop.around);
   }
-  if (left >= right || top >= bottom || image.Empty() || image.Bits() != 24 || canvas.Empty()) return;
-  const bool same = image.Width() == transform.ShownWidth() && image.Height() == transform.ShownHeight();
+  if (left >= right || top >= bottom || image.Empty() || image.Bits() != 24 || canvas.Empty())
+    return;
+  const bool same =
+      image.Width() == transform.ShownWidth() && image.Height() == transform.ShownHeight();
   const bool between = smooth && !same;
   const bool opaque = source.alpha.Empty();
-  const auto columns = PositionsOf(left - x, right - left, transform.ShownWidth(), image.Width(), between);
-  const auto rows = PositionsOf(top - y, bottom - top, transform.ShownHeight(), image.Height(), between);
+  const auto columns =
+      PositionsOf(left - x, right - left, transform.ShownWidth(), image.Width(), between);
+  const auto rows =
+      PositionsOf(top - y, bottom - top, transform.ShownHeight(), image.Height(), between);
   const RowsBehind behind(backdrop, left, opaque ? 0 : right - left);
   BetweenPixels pixels(source, columns);
   for (int32_t line = top; line < bottom; ++line) {

@@ -30,10 +30,12 @@ ScaleFilter ShrinkFilter() {
 }
 
 Status Shrink(const PictureRecord& picture, int32_t width, int32_t height, ViewPixels& shrunk) {
-  return ScaleFiltered(picture.image, picture.alpha, {width, height}, ShrinkFilter(), shrunk.image, shrunk.alpha);
+  return ScaleFiltered(picture.image, picture.alpha, {width, height}, ShrinkFilter(), shrunk.image,
+                       shrunk.alpha);
 }
 
-// The transform of the profile that this thread met last: pictures of a folder and frames of an animation mostly share theirs.
+// The transform of the profile that this thread met last: pictures of a folder and frames of an
+// animation mostly share theirs.
 const ColorTransform& TransformOf(const std::vector<uint8_t>& profile) {
   thread_local std::vector<uint8_t> last;
   thread_local std::unique_ptr<ColorTransform> transform;
@@ -57,13 +59,16 @@ Status LoadInto(const ViewRequest& request, ViewPicture& view) {
 
 void SetScreenProfile(std::vector<uint8_t> profile) { screenProfile = std::move(profile); }
 
-ViewLook ViewLook::FromSettings() { return {settings.ViewModeColorProfiles != 0, settings.ViewModeCheckerboard != 0}; }
+ViewLook ViewLook::FromSettings() {
+  return {settings.ViewModeColorProfiles != 0, settings.ViewModeCheckerboard != 0};
+}
 
 uint64_t ViewPicture::Bytes() const {
   const auto bytes = [](const PackedImage& image, const PackedImage& alpha) {
     return image.Bytes().size() + alpha.Bytes().size();
   };
-  return kRecordBytes + bytes(fitted.image, fitted.alpha) + (picture == nullptr ? 0 : bytes(picture->image, picture->alpha));
+  return kRecordBytes + bytes(fitted.image, fitted.alpha) +
+         (picture == nullptr ? 0 : bytes(picture->image, picture->alpha));
 }
 
 Status PrepareView(PicturePointer picture, ViewPicture& view) {
@@ -94,7 +99,8 @@ std::string SizeAndZoom(const PictureRecord& picture, double scale) {
 
 bool ViewPicture::HasChanged() const {
   const platform::FileFacts now = platform::FactsOf(request.path);
-  return now.identity != facts.identity || now.device != facts.device || now.size != facts.size || now.modified != facts.modified;
+  return now.identity != facts.identity || now.device != facts.device || now.size != facts.size ||
+         now.modified != facts.modified;
 }
 
 Status PixelsForOthers(const ViewPicture& view, Color background, RgbImage& pixels) {
@@ -129,7 +135,8 @@ ViewPicturePointer TurnedView(const ViewPicture& view, Orientation turn) {
   if (turned->picture == nullptr) return nullptr;
   PictureRecord& picture = *turned->picture;
   if (OrientImage(old.image, turn, picture.image) != Status::Ok) return nullptr;
-  if (!old.alpha.Empty() && OrientImage(old.alpha, turn, picture.alpha) != Status::Ok) return nullptr;
+  if (!old.alpha.Empty() && OrientImage(old.alpha, turn, picture.alpha) != Status::Ok)
+    return nullptr;
   picture.width = picture.image.Width();
   picture.height = picture.image.Height();
   picture.bitsPerPixel = old.bitsPerPixel;
@@ -144,7 +151,9 @@ ViewPicturePointer TurnedView(const ViewPicture& view, Orientation turn) {
 }
 
 ViewLoader::ViewLoader(uint64_t capacity, std::function<void()> wake)
-    : capacity_(capacity), wake_(std::move(wake)), work_(Lane::Urgent, 1, [this] { return Next(); }) {}
+    : capacity_(capacity),
+      wake_(std::move(wake)),
+      work_(Lane::Urgent, 1, [this] { return Next(); }) {}
 
 void ViewLoader::Want(std::vector<ViewRequest> requests) {
   {
@@ -166,15 +175,17 @@ ViewPicturePointer ViewLoader::Find(const ViewRequest& request) const {
 
 void ViewLoader::Forget(const std::string& path) {
   const std::lock_guard lock(mutex_);
-  std::erase_if(pictures_, [&](const ViewPicturePointer& picture) { return picture->request.path == path; });
+  std::erase_if(pictures_,
+                [&](const ViewPicturePointer& picture) { return picture->request.path == path; });
 }
 
 // The most urgent request that has no picture yet and may still have one.
 bool ViewLoader::NextRequest(ViewRequest& request) {
   if (full_) return false;
   for (const ViewRequest& candidate : requests_) {
-    const bool there = std::any_of(pictures_.begin(), pictures_.end(),
-                                   [&](const ViewPicturePointer& picture) { return picture->request.SamePicture(candidate); });
+    const bool there = std::any_of(
+        pictures_.begin(), pictures_.end(),
+        [&](const ViewPicturePointer& picture) { return picture->request.SamePicture(candidate); });
     if (there) continue;
     request = candidate;
     return true;
@@ -238,7 +249,9 @@ std::unique_ptr<ViewScaler::Scaled> ViewScaler::Fetch() {
 LatestWork::Piece ViewScaler::Next() {
   const std::lock_guard lock(mutex_);
   if (request_ == nullptr) return {};
-  return [this, picture = std::exchange(request_, nullptr), width = width_, height = height_] { Scale(picture, width, height); };
+  return [this, picture = std::exchange(request_, nullptr), width = width_, height = height_] {
+    Scale(picture, width, height);
+  };
 }
 
 void ViewScaler::Scale(ViewPicturePointer picture, int32_t width, int32_t height) {

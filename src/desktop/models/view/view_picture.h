@@ -27,11 +27,12 @@ struct ViewLook {
   bool operator==(const ViewLook&) const = default;
 };
 
-// The color profile of the screen that pictures are made for from here on; empty for sRGB. To be told before the first picture
-// is asked for.
+// The color profile of the screen that pictures are made for from here on; empty for sRGB. To be
+// told before the first picture is asked for.
 void SetScreenProfile(std::vector<uint8_t> profile);
 
-// A picture as a view window wants it: a page of a file, with the size of the window that it is to fit.
+// A picture as a view window wants it: a page of a file, with the size of the window that it is to
+// fit.
 struct ViewRequest {
   std::string path;
   int32_t page = 0;
@@ -40,7 +41,9 @@ struct ViewRequest {
   ReadOptions read = ReadOptionsFromSettings();
 
   // Whether both mean the same pixels, whatever window they are to fit.
-  bool SamePicture(const ViewRequest& other) const { return path == other.path && page == other.page && look == other.look; }
+  bool SamePicture(const ViewRequest& other) const {
+    return path == other.path && page == other.page && look == other.look;
+  }
 };
 
 // Pixels of 24 bits with their alpha plane, which is empty where all are opaque.
@@ -48,13 +51,15 @@ struct ViewPixels {
   PackedImage image, alpha;
 };
 
-// A decoded picture: upright, 24 bits, with an alpha plane only if its look wants it and not all of it is opaque.
+// A decoded picture: upright, 24 bits, with an alpha plane only if its look wants it and not all of
+// it is opaque.
 struct ViewPicture {
   ViewRequest request;
   platform::FileFacts facts;  // of the file, as it was read
   Status status = Status::Ok;
   PicturePointer picture;          // null unless Ok
-  ViewPixels fitted;               // as large as the fit of the request's window; empty where that is the picture's own size or more
+  // as large as the fit of the request's window; empty where that is the picture's own size or more
+  ViewPixels fitted;
   std::vector<std::string> photo;  // what the camera wrote about it, in lines
   double seconds = 0;              // that decoding took
 
@@ -69,7 +74,8 @@ using ViewPicturePointer = std::shared_ptr<const ViewPicture>;
 // "4000 x 3000 pixels, 3.2 MB, 25%" of a picture at a scale.
 std::string SizeAndZoom(const PictureRecord& picture, double scale);
 
-// A decoded picture's pixels for other programs: on a background, 0x00BBGGRR, and in sRGB whatever the screen's colors are.
+// A decoded picture's pixels for other programs: on a background, 0x00BBGGRR, and in sRGB whatever
+// the screen's colors are.
 Status PixelsForOthers(const ViewPicture& view, Color background, RgbImage& pixels);
 
 // Makes a decoded picture what the request of `view` asks for. Statuses of PrepareForDisplay.
@@ -87,8 +93,9 @@ class ViewLoader {
   ViewLoader(const ViewLoader&) = delete;
   ViewLoader& operator=(const ViewLoader&) = delete;
 
-  // What is wanted from here on, most urgent first. Pictures that are not among these are given back; what does not fit
-  // into the capacity beside more urgent ones is not decoded, the first one always is.
+  // What is wanted from here on, most urgent first. Pictures that are not among these are given
+  // back; what does not fit into the capacity beside more urgent ones is not decoded, the first one
+  // always is.
   void Want(std::vector<ViewRequest> requests);
   // The picture of a request if it is there, whatever window it was fitted to.
   ViewPicturePointer Find(const ViewRequest& request) const;

@@ -14,7 +14,8 @@ namespace {
 // The scales of choice::ViewZoom 1 to 12.
 constexpr double kListedScales[] = {0.10, 0.20, 0.25, 1.0 / 3, 0.50, 0.75, 1, 1.5, 2, 3, 4, 8};
 
-// Where an edge of a picture of that length lies: in the middle when it fits, else with no gap at either side.
+// Where an edge of a picture of that length lies: in the middle when it fits, else with no gap at
+// either side.
 double KeptInside(double position, double length, double window) {
   if (length <= window) return (window - length) / 2;
   return std::clamp(position, window - length, 0.0);
@@ -46,7 +47,8 @@ void ViewTransform::SetMode(ZoomMode mode) {
 void ViewTransform::SetModeFromKey(int32_t zoom) {
   if (zoom == choice::kZoomFitWidth) return SetMode(ZoomMode::FitWidth);
   if (zoom == choice::kZoomFill) return SetMode(ZoomMode::Fill);
-  if (zoom < 1 || zoom > static_cast<int32_t>(std::size(kListedScales))) return SetMode(ZoomMode::Fit);
+  if (zoom < 1 || zoom > static_cast<int32_t>(std::size(kListedScales)))
+    return SetMode(ZoomMode::Fit);
   ZoomToMiddle(kListedScales[zoom - 1]);
 }
 
@@ -67,12 +69,14 @@ void ViewTransform::Pan(double dx, double dy) {
 }
 
 ViewPlace ViewTransform::Place() const {
-  return {mode_, scale_ / FitScale(), (windowWidth_ / 2.0 - x_) / ShownWidth(), (windowHeight_ / 2.0 - y_) / ShownHeight()};
+  return {mode_, scale_ / FitScale(), (windowWidth_ / 2.0 - x_) / ShownWidth(),
+          (windowHeight_ / 2.0 - y_) / ShownHeight()};
 }
 
 void ViewTransform::SetPlace(const ViewPlace& place) {
   mode_ = place.mode;
-  if (mode_ == ZoomMode::Free) scale_ = std::clamp(place.timesFit * FitScale(), kSmallest, kLargest);
+  if (mode_ == ZoomMode::Free)
+    scale_ = std::clamp(place.timesFit * FitScale(), kSmallest, kLargest);
   ScaleByMode();
   PutCentre(place.centreX, place.centreY);
 }
@@ -82,13 +86,18 @@ void ViewTransform::StartAfresh(int32_t zoom) {
   PutCentre(0.5, 0.5);
 }
 
-int32_t ViewTransform::ShownWidth() const { return std::max(static_cast<int32_t>(std::lround(pictureWidth_ * scale_)), 1); }
-int32_t ViewTransform::ShownHeight() const { return std::max(static_cast<int32_t>(std::lround(pictureHeight_ * scale_)), 1); }
+int32_t ViewTransform::ShownWidth() const {
+  return std::max(static_cast<int32_t>(std::lround(pictureWidth_ * scale_)), 1);
+}
+int32_t ViewTransform::ShownHeight() const {
+  return std::max(static_cast<int32_t>(std::lround(pictureHeight_ * scale_)), 1);
+}
 int32_t ViewTransform::X() const { return static_cast<int32_t>(std::floor(x_)); }
 int32_t ViewTransform::Y() const { return static_cast<int32_t>(std::floor(y_)); }
 
 double ViewTransform::FitScale() const {
-  return std::min(static_cast<double>(windowWidth_) / pictureWidth_, static_cast<double>(windowHeight_) / pictureHeight_);
+  return std::min(static_cast<double>(windowWidth_) / pictureWidth_,
+                  static_cast<double>(windowHeight_) / pictureHeight_);
 }
 
 void ViewTransform::ScaleByMode() {

@@ -12,11 +12,12 @@ enum class ZoomMode { Fit, FitWidth, Fill, Free };
 struct ViewPlace {
   ZoomMode mode = ZoomMode::Fit;
   double timesFit = 1;                  // the scale as a multiple of that which fits the window
-  double centreX = 0.5, centreY = 0.5;  // what is in the middle of the window, in parts of the picture
+  // what is in the middle of the window, in parts of the picture
+  double centreX = 0.5, centreY = 0.5;
 };
 
-// Where a picture is in a view window and how large: pure arithmetic in device pixels. A scale of 1 shows each pixel of
-// the picture as one pixel of the screen.
+// Where a picture is in a view window and how large: pure arithmetic in device pixels. A scale of 1
+// shows each pixel of the picture as one pixel of the screen.
 class ViewTransform {
  public:
   static constexpr double kStep = 1.25;  // of zooming in and out

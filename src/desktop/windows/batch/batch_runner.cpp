@@ -28,19 +28,20 @@
 namespace fotomill::desktop {
 
 BatchRunner::BatchRunner(Shell& shell) : shell_(shell) {
-  thread_ = std::make_unique<BatchThread>(
-      *this, [this](std::function<void()> action) { CallAfter([action = std::move(action)] { action(); }); });
+  thread_ = std::make_unique<BatchThread>(*this, [this](std::function<void()> action) {
+    CallAfter([action = std::move(action)] { action(); });
+  });
 }
 
 BatchRunner::~BatchRunner() { thread_.reset(); }
 
 void BatchRunner::Run(std::vector<BatchFile> files, BatchFunction function, BatchJob job) {
-  Run(std::move(job), [files = std::move(files), function = std::move(function)](BatchJob& running) {
-    return RunBatch(files, function, running);
-  });
+  Run(std::move(job), [files = std::move(files), function = std::move(function)](
+                          BatchJob& running) { return RunBatch(files, function, running); });
 }
 
-void BatchRunner::Run(BatchJob job, BatchThread::Work work, std::shared_ptr<PreviousFiles> previous) {
+void BatchRunner::Run(BatchJob job, BatchThread::Work work,
+                      std::shared_ptr<PreviousFiles> previous) {
   waiting_.push_back({std::move(job), std::move(work), std::move(previous)});
   if (!Running()) {
     StartNext();
@@ -76,7 +77,9 @@ void BatchRunner::CloseBox() {
   if (box_ != nullptr) std::exchange(box_, nullptr)->Destroy();
 }
 
-wxWindow* BatchRunner::DialogParent() const { return box_ != nullptr ? static_cast<wxWindow*>(box_) : &shell_.Window(); }
+wxWindow* BatchRunner::DialogParent() const {
+  return box_ != nullptr ? static_cast<wxWindow*>(box_) : &shell_.Window();
+}
 
 // --- the progress box ---
 
@@ -87,7 +90,9 @@ void BatchRunner::BatchOpened() {
     if (box_ == &box) box_ = nullptr;
     box.Destroy();
   };
-  events.selectFailed = [this](const std::vector<std::string>& files) { shell_.Tabs().SelectFiles(files); };
+  events.selectFailed = [this](const std::vector<std::string>& files) {
+    shell_.Tabs().SelectFiles(files);
+  };
   LeaveBox();
   box_ = new ProgressWindow(&shell_.Window(), shell_.Thumbnails(), events);
   box_->Show();
@@ -99,8 +104,10 @@ void BatchRunner::BatchLine(const ProgressLine& line, const FileOutcome& outcome
   LogEvent("batch-line", line.text);
   failed_ += line.item.file >= 0 && outcome.status != Status::Ok && !outcome.skipped;
   if (box_ != nullptr) box_->AddLine(line, outcome.source);
-  const bool written = outcome.status == Status::Ok && !outcome.skipped && !outcome.replaced && !outcome.destination.empty();
-  if (written) written_.steps.push_back({outcome.source, platform::AbsolutePath(outcome.destination)});
+  const bool written = outcome.status == Status::Ok && !outcome.skipped && !outcome.replaced &&
+                       !outcome.destination.empty();
+  if (written)
+    written_.steps.push_back({outcome.source, platform::AbsolutePath(outcome.destination)});
 }
 
 void BatchRunner::BatchStatus(const std::string& status) {
@@ -132,14 +139,17 @@ void BatchRunner::BatchEnded(Status status, const BatchJob& job) {
   if (previous_ != nullptr) shell_.Files().NoteDone(std::exchange(previous_, nullptr)->Operation());
   if (job.filesChanged) shell_.FilesChanged();
   if (!seen_)
-    NotifyUser(shell_.Window(), failed_ == 0 ? Label("Batch finished") : Label("Batch finished with errors"), Shown(CountLine(job.progress.Files())));
+    NotifyUser(shell_.Window(),
+               failed_ == 0 ? Label("Batch finished") : Label("Batch finished with errors"),
+               Shown(CountLine(job.progress.Files())));
   if (status == Status::Ok) shell_.Report(CountLine(job.progress.Files()));
   CallAfter([this] { StartNext(); });
 }
 
 // --- questions ---
 
-OverwriteAnswer BatchRunner::AskOverwrite(const OverwriteQuestion& question, const OverwritePreview& preview) {
+OverwriteAnswer BatchRunner::AskOverwrite(const OverwriteQuestion& question,
+                                          const OverwritePreview& preview) {
   OverwriteDialog dialog(DialogParent(), question, preview);
   LogEvent("prompt", "overwrite " + question.path);
   dialog.ShowModal();
@@ -148,16 +158,19 @@ OverwriteAnswer BatchRunner::AskOverwrite(const OverwriteQuestion& question, con
 
 std::optional<std::string> BatchRunner::AskDestinationName(const NameQuestion& question) {
   const wxString problem = question.problem.empty() ? wxString() : Shown(question.problem) + "\n";
-  wxTextEntryDialog dialog(DialogParent(), problem + Label("Write %1 to:", Shown(platform::FileNameOf(question.source))),
-                           question.title.empty() ? Label("Destination name") : Shown(Tr(question.title)),
-                           wxString::FromUTF8(question.path));
+  wxTextEntryDialog dialog(
+      DialogParent(), problem + Label("Write %1 to:", Shown(platform::FileNameOf(question.source))),
+      question.title.empty() ? Label("Destination name") : Shown(Tr(question.title)),
+      wxString::FromUTF8(question.path));
   LogEvent("prompt", "name " + question.path);
   if (dialog.ShowModal() != wxID_OK) return std::nullopt;
   return Utf8(dialog.GetValue());
 }
 
 std::optional<std::string> BatchRunner::AskPassword(const std::string& path) {
-  wxPasswordEntryDialog dialog(DialogParent(), Label("Password for %1:", Shown(platform::FileNameOf(path))), Label("Password"));
+  wxPasswordEntryDialog dialog(DialogParent(),
+                               Label("Password for %1:", Shown(platform::FileNameOf(path))),
+                               Label("Password"));
   LogEvent("prompt", "password " + path);
   if (dialog.ShowModal() != wxID_OK) return std::nullopt;
   return Utf8(dialog.GetValue());
@@ -169,7 +182,8 @@ bool BatchRunner::ConfirmFormat(const std::string& question) {
 }
 
 bool BatchRunner::Confirm(const std::string& question, const std::string& yes) {
-  wxMessageDialog dialog(DialogParent(), Shown(question), "Fotomill Professional", wxOK | wxCANCEL | wxICON_QUESTION);
+  wxMessageDialog dialog(DialogParent(), Shown(question), "Fotomill Professional",
+                         wxOK | wxCANCEL | wxICON_QUESTION);
   dialog.SetOKLabel(Shown(yes));
   LogEvent("prompt", "confirm " + question);
   return dialog.ShowModal() == wxID_OK;
@@ -177,14 +191,18 @@ bool BatchRunner::Confirm(const std::string& question, const std::string& yes) {
 
 void TurnSelection(Shell& shell, Orientation turn) {
   std::vector<BatchFile> files;
-  for (const std::string& file : shell.Tabs().SelectedFiles()) files.push_back({.name = file, .below = {}, .hint = {}});
+  for (const std::string& file : shell.Tabs().SelectedFiles())
+    files.push_back({.name = file, .below = {}, .hint = {}});
   if (files.empty()) return;
   auto previous = std::make_shared<PreviousFiles>(DropThumbnails);
-  TurnFunction function{.request = {.turn = turn, .seenByExif = settings.ExifAdjustOrientation != 0}, .inPlace = true};
+  TurnFunction function{
+      .request = {.turn = turn, .seenByExif = settings.ExifAdjustOrientation != 0},
+      .inPlace = true};
   function.keepPrevious = [previous](const std::string& path) { return previous->Keep(path); };
   function.replaced = [previous](const std::string& path) { previous->Replaced(path); };
   shell.Batches().Run(
-      NewBatchJob(), [files, function](BatchJob& job) { return RunTurn(files, function, job); }, previous);
+      NewBatchJob(), [files, function](BatchJob& job) { return RunTurn(files, function, job); },
+      previous);
 }
 
 void ConvertSelection(Shell& shell) {

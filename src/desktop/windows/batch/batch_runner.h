@@ -49,7 +49,8 @@ class BatchRunner : public wxEvtHandler, public BatchWindows {
   void BatchProgress(uint32_t done, uint32_t count) override;
   void BatchStaysOpen(const ProgressModel& model) override;
   void BatchCloses() override;
-  OverwriteAnswer AskOverwrite(const OverwriteQuestion& question, const OverwritePreview& preview) override;
+  OverwriteAnswer AskOverwrite(const OverwriteQuestion& question,
+                               const OverwritePreview& preview) override;
   std::optional<std::string> AskDestinationName(const NameQuestion& question) override;
   std::optional<std::string> AskPassword(const std::string& path) override;
   bool ConfirmFormat(const std::string& question) override;
@@ -63,7 +64,8 @@ class BatchRunner : public wxEvtHandler, public BatchWindows {
   bool seen_ = false;                        // its end, by the user
   size_t failed_ = 0;                        // files of the batch that runs
   std::shared_ptr<PreviousFiles> previous_;  // of the batch that runs
-  FileOperation written_;                         // by the batch that runs, as far as it can be taken back
+  // by the batch that runs, as far as it can be taken back
+  FileOperation written_;
   std::unique_ptr<BatchThread> thread_;
 };
 

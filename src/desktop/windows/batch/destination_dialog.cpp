@@ -25,16 +25,18 @@
 
 namespace fotomill::desktop {
 
-DestinationDialog::DestinationDialog(wxWindow* parent, const wxString& verb, const std::vector<std::string>& files)
-    : wxDialog(parent, wxID_ANY, verb, wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
-               "DestinationBox"),
+DestinationDialog::DestinationDialog(wxWindow* parent, const wxString& verb,
+                                     const std::vector<std::string>& files)
+    : wxDialog(parent, wxID_ANY, verb, wxDefaultPosition, wxDefaultSize,
+               wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "DestinationBox"),
       files_(files) {
   const int gap = FromDIP(8);
   auto* sizer = new wxBoxSizer(wxVERTICAL);
   const auto below = wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxTOP, gap * 3 / 2);
 
   auto* formatRow = new wxBoxSizer(wxHORIZONTAL);
-  formatRow->Add(new wxStaticText(this, wxID_ANY, Label("&Format:")), wxSizerFlags().CenterVertical().Border(wxRIGHT, gap));
+  formatRow->Add(new wxStaticText(this, wxID_ANY, Label("&Format:")),
+                 wxSizerFlags().CenterVertical().Border(wxRIGHT, gap));
   format_ = new wxChoice(this, wxID_ANY);
   format_->SetName(Label("Format"));
   for (const DestinationFormat& format : formats_) format_->Append(Shown(format.description));
@@ -43,15 +45,18 @@ DestinationDialog::DestinationDialog(wxWindow* parent, const wxString& verb, con
   formatRow->Add(options_, wxSizerFlags().Border(wxLEFT, gap));
   sizer->Add(formatRow, below);
 
-  beside_ = new wxRadioButton(this, wxID_ANY, Label("&Beside each picture"), wxDefaultPosition, wxDefaultSize, wxRB_GROUP);
+  beside_ = new wxRadioButton(this, wxID_ANY, Label("&Beside each picture"), wxDefaultPosition,
+                              wxDefaultSize, wxRB_GROUP);
   into_ = new wxRadioButton(this, wxID_ANY, Label("&Into the folder"));
   sizer->Add(beside_, below);
   auto* folderRow = new wxBoxSizer(wxHORIZONTAL);
-  folder_ = new wxComboBox(this, wxID_ANY, "", wxDefaultPosition, FromDIP(wxSize(420, -1)), 0, nullptr, 0, wxDefaultValidator,
-                           Label("Folder"));
-  for (const std::string& folder : RecentDestinations()) folder_->Append(wxString::FromUTF8(folder));
+  folder_ = new wxComboBox(this, wxID_ANY, "", wxDefaultPosition, FromDIP(wxSize(420, -1)), 0,
+                           nullptr, 0, wxDefaultValidator, Label("Folder"));
+  for (const std::string& folder : RecentDestinations())
+    folder_->Append(wxString::FromUTF8(folder));
   folder_->SetValue(folder_->GetCount() > 0 ? folder_->GetString(0)
-                                            : wxString::FromUTF8(std::string(platform::SplitPath(files_.front()).folder)));
+                                            : wxString::FromUTF8(std::string(
+                                                  platform::SplitPath(files_.front()).folder)));
   folder_->AutoCompleteDirectories();
   browse_ = new wxButton(this, wxID_ANY, Label("B&rowse..."));
   folderRow->Add(into_, wxSizerFlags().CenterVertical().Border(wxRIGHT, gap));
@@ -67,7 +72,8 @@ DestinationDialog::DestinationDialog(wxWindow* parent, const wxString& verb, con
   metadata_->SetValue(settings.PreserveEXIF != 0);
   for (wxCheckBox* box : {reduce_, orient_, metadata_}) sizer->Add(box, below);
 
-  preview_ = new wxStaticText(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxST_NO_AUTORESIZE | wxST_ELLIPSIZE_MIDDLE);
+  preview_ = new wxStaticText(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize,
+                              wxST_NO_AUTORESIZE | wxST_ELLIPSIZE_MIDDLE);
   sizer->Add(preview_, below);
 
   auto* buttons = new wxBoxSizer(wxHORIZONTAL);
@@ -80,7 +86,8 @@ DestinationDialog::DestinationDialog(wxWindow* parent, const wxString& verb, con
   ok_->SetDefault();
 
   for (size_t i = 0; i < formats_.size(); ++i) {
-    if (EqualIgnoringCase(formats_[i].extension, settings.DefaultFileExtension)) format_->SetSelection(static_cast<int>(i));
+    if (EqualIgnoringCase(formats_[i].extension, settings.DefaultFileExtension))
+      format_->SetSelection(static_cast<int>(i));
   }
   if (format_->GetSelection() == wxNOT_FOUND) format_->SetSelection(0);
   (settings.DestForceSourceDir != 0 ? beside_ : into_)->SetValue(true);
@@ -116,8 +123,10 @@ void DestinationDialog::UpdateControls() {
   ok_->Enable(problem.empty() && (!into_->GetValue() || !choice.folder.empty()));
   const std::string first = FirstDestination(choice, files_.front());
   wxString text = problem.empty() ? Label("First: %1", Shown(first)) : Shown(problem);
-  const uint64_t space = platform::FreeSpace(choice.folder.empty() ? files_.front() : choice.folder);
-  if (problem.empty() && space > 0) text = Label("%1 (%2 free)", text, Shown(SizeText(space, choice::kSizeFitting)));
+  const uint64_t space =
+      platform::FreeSpace(choice.folder.empty() ? files_.front() : choice.folder);
+  if (problem.empty() && space > 0)
+    text = Label("%1 (%2 free)", text, Shown(SizeText(space, choice::kSizeFitting)));
   preview_->SetLabel(text);
   Layout();
 }
@@ -136,7 +145,8 @@ void DestinationDialog::Browse() {
 void DestinationDialog::OnOk(wxCommandEvent& event) {
   if (wxGetKeyState(WXK_SHIFT) && ShiftOpensOverrideBox()) ShowFormatOptions();
   const DestinationChoice choice = Choice();
-  if (!choice.folder.empty()) (void)AddToHistoryList(HistoryList::Destination, platform::AbsolutePath(choice.folder));
+  if (!choice.folder.empty())
+    (void)AddToHistoryList(HistoryList::Destination, platform::AbsolutePath(choice.folder));
   settings.DefaultFileExtension.AssignCut(choice.extension);
   settings.DestForceSourceDir = choice.folder.empty() ? 1 : 0;
   event.Skip();

@@ -25,7 +25,9 @@ bool HasPlaceForNotifications() {
 }  // namespace
 
 bool InFront() {
-  const auto active = [](wxWindow* window) { return static_cast<wxTopLevelWindow*>(window)->IsActive(); };
+  const auto active = [](wxWindow* window) {
+    return static_cast<wxTopLevelWindow*>(window)->IsActive();
+  };
   return std::any_of(wxTopLevelWindows.begin(), wxTopLevelWindows.end(), active);
 }
 

@@ -23,19 +23,22 @@ constexpr int kPaneSide = 240;
 
 }  // namespace
 
-OverwriteDialog::OverwriteDialog(wxWindow* parent, const OverwriteQuestion& question, const OverwritePreview& preview)
+OverwriteDialog::OverwriteDialog(wxWindow* parent, const OverwriteQuestion& question,
+                                 const OverwritePreview& preview)
     : wxDialog(parent, wxID_ANY, Label(kOverwriteTitle.data()), wxDefaultPosition, wxDefaultSize,
                wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "OverwriteBox") {
   const int gap = FromDIP(8);
   auto* sizer = new wxBoxSizer(wxVERTICAL);
   const auto below = wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxTOP, gap);
   sizer->Add(new wxStaticText(this, wxID_ANY, Label(kOverwriteText.data())), below);
-  sizer->Add(new wxStaticText(this, wxID_ANY, Shown(question.path), wxDefaultPosition, wxDefaultSize, wxST_ELLIPSIZE_MIDDLE),
+  sizer->Add(new wxStaticText(this, wxID_ANY, Shown(question.path), wxDefaultPosition,
+                              wxDefaultSize, wxST_ELLIPSIZE_MIDDLE),
              below);
   auto* row = new wxBoxSizer(wxHORIZONTAL);
-  row->Add(new wxStaticText(this, wxID_ANY, Label("&File name:")), wxSizerFlags().CenterVertical().Border(wxRIGHT, gap));
-  name_ =
-      new wxTextCtrl(this, wxID_ANY, Shown(question.name), wxDefaultPosition, wxDefaultSize, 0, wxDefaultValidator, Label("File name"));
+  row->Add(new wxStaticText(this, wxID_ANY, Label("&File name:")),
+           wxSizerFlags().CenterVertical().Border(wxRIGHT, gap));
+  name_ = new wxTextCtrl(this, wxID_ANY, Shown(question.name), wxDefaultPosition, wxDefaultSize, 0,
+                         wxDefaultValidator, Label("File name"));
   row->Add(name_, wxSizerFlags(1));
   row->Add(new wxStaticText(this, wxID_ANY, Shown(platform::SplitPath(question.path).extension)),
            wxSizerFlags().CenterVertical().Border(wxLEFT, gap / 2));
@@ -45,7 +48,9 @@ OverwriteDialog::OverwriteDialog(wxWindow* parent, const OverwriteQuestion& ques
     problem->SetForegroundColour(FaultColor());
     sizer->Add(problem, below);
   }
-  if (question.checks.previews) sizer->Add(panes_ = MakePreviews(question, preview), wxSizerFlags(1).Expand().Border(wxALL, gap));
+  if (question.checks.previews)
+    sizer->Add(panes_ = MakePreviews(question, preview),
+               wxSizerFlags(1).Expand().Border(wxALL, gap));
 
   const auto check = [&](std::string_view label, bool value) {
     auto* box = new wxCheckBox(this, wxID_ANY, Shown(Tr(label)));
@@ -90,7 +95,8 @@ OverwriteDialog::OverwriteDialog(wxWindow* parent, const OverwriteQuestion& ques
   });
 }
 
-wxSizer* OverwriteDialog::MakePreviews(const OverwriteQuestion& question, const OverwritePreview& preview) {
+wxSizer* OverwriteDialog::MakePreviews(const OverwriteQuestion& question,
+                                       const OverwritePreview& preview) {
   auto* panes = new wxBoxSizer(wxHORIZONTAL);
   const auto pane = [&](const wxString& title, const RgbImage& image, const std::string& text) {
     auto* column = new wxBoxSizer(wxVERTICAL);
@@ -101,18 +107,21 @@ wxSizer* OverwriteDialog::MakePreviews(const OverwriteQuestion& question, const 
     if (image.Empty()) {
       column->Add(side.x, side.y);
     } else {
-      auto* picture = new wxStaticBitmap(this, wxID_ANY, BitmapOf(image), wxDefaultPosition, side, 0, title);
+      auto* picture =
+          new wxStaticBitmap(this, wxID_ANY, BitmapOf(image), wxDefaultPosition, side, 0, title);
       column->Add(picture, wxSizerFlags(1).Expand().Border(wxTOP | wxBOTTOM, FromDIP(4)));
     }
     for (size_t from = 0; from < text.size();) {
       const size_t end = std::min(text.find('\n', from), text.size());
-      column->Add(new wxStaticText(this, wxID_ANY, Shown(text.substr(from, end - from))), wxSizerFlags().CenterHorizontal());
+      column->Add(new wxStaticText(this, wxID_ANY, Shown(text.substr(from, end - from))),
+                  wxSizerFlags().CenterHorizontal());
       from = end + 1;
     }
     panes->Add(column, wxSizerFlags(1).Expand().Border(wxALL, FromDIP(4)));
   };
   pane(Label("Existing file"), preview.existing, preview.existingText);
-  pane(Label("New, from %1", Shown(platform::FileNameOf(question.source))), preview.incoming, preview.incomingText);
+  pane(Label("New, from %1", Shown(platform::FileNameOf(question.source))), preview.incoming,
+       preview.incomingText);
   return panes;
 }
 
@@ -121,8 +130,8 @@ OverwriteAnswer OverwriteDialog::Answer() const {
   answer.ok = GetReturnCode() == wxID_OK;
   answer.skipRest = skipRest_;
   answer.name = Utf8(name_->GetValue());
-  answer.checks = {notify_->GetValue(), keepBoth_->GetValue(), applyToRest_->GetValue(), recycle_->GetValue(),
-                   previews_->GetValue()};
+  answer.checks = {notify_->GetValue(), keepBoth_->GetValue(), applyToRest_->GetValue(),
+                   recycle_->GetValue(), previews_->GetValue()};
   return answer;
 }
 

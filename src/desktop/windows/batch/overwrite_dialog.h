@@ -10,10 +10,12 @@ class wxTextCtrl;
 
 namespace fotomill::desktop {
 
-// The overwrite prompt: what is there beside what would take its place, a field for another name, and what to do.
+// The overwrite prompt: what is there beside what would take its place, a field for another name,
+// and what to do.
 class OverwriteDialog : public wxDialog {
  public:
-  OverwriteDialog(wxWindow* parent, const OverwriteQuestion& question, const OverwritePreview& preview);
+  OverwriteDialog(wxWindow* parent, const OverwriteQuestion& question,
+                  const OverwritePreview& preview);
   // After ShowModal.
   OverwriteAnswer Answer() const;
 

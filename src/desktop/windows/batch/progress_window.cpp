@@ -43,7 +43,8 @@ wxString TimeLeft(double seconds) {
 class ProgressWindow::DrawnList : public wxVListBox {
  public:
   DrawnList(ProgressWindow& box, long style) : box_(box) {
-    Create(box.panel_, kProgressListId, wxDefaultPosition, wxDefaultSize, style | wxBORDER_THEME, Label("Files"));
+    Create(box.panel_, kProgressListId, wxDefaultPosition, wxDefaultSize, style | wxBORDER_THEME,
+           Label("Files"));
     SetItemCount(box.rows_.size());
   }
 
@@ -55,19 +56,23 @@ class ProgressWindow::DrawnList : public wxVListBox {
       const ThumbnailPointer thumbnail = side > 0 ? box_.thumbnails_.FindAny(row.source) : nullptr;
       if (thumbnail != nullptr && thumbnail->status == Status::Ok)
         DrawThumbnail(dc, *thumbnail, wxRect(left, rect.y, side, rect.height));
-      if (HasPicture(row) || box_.settings_.showMissingThumbnails) left += FromDIP(kThumbnailSide) + FromDIP(8);
+      if (HasPicture(row) || box_.settings_.showMissingThumbnails)
+        left += FromDIP(kThumbnailSide) + FromDIP(8);
     }
     const bool failed = row.line.item.status != Status::Ok && !row.line.item.skipped;
-    wxColour text = wxSystemSettings::GetColour(IsSelected(n) ? wxSYS_COLOUR_HIGHLIGHTTEXT : wxSYS_COLOUR_LISTBOXTEXT);
+    wxColour text = wxSystemSettings::GetColour(IsSelected(n) ? wxSYS_COLOUR_HIGHLIGHTTEXT
+                                                              : wxSYS_COLOUR_LISTBOXTEXT);
     if (failed && !IsSelected(n)) text = ToWx(CurrentPalette().fault);
     dc.SetTextForeground(text);
     dc.SetFont(GetFont());
     const wxRect place(left, rect.y, rect.GetRight() - left - FromDIP(4), rect.height);
     const auto cut = [&](const wxString& line) {
-      return wxControl::Ellipsize(line, dc, wxELLIPSIZE_MIDDLE, place.width, wxELLIPSIZE_FLAGS_NONE);
+      return wxControl::Ellipsize(line, dc, wxELLIPSIZE_MIDDLE, place.width,
+                                  wxELLIPSIZE_FLAGS_NONE);
     };
     // Tall rows have the name above and what became of the file below.
-    const bool two = IsAboutFile(row) && rect.height >= 2 * GetCharHeight() + FromDIP(4) && row.line.text.starts_with(row.source);
+    const bool two = IsAboutFile(row) && rect.height >= 2 * GetCharHeight() + FromDIP(4) &&
+                     row.line.text.starts_with(row.source);
     wxString label = cut(Shown(row.line.text));
     if (two) {
       std::string outcome = row.line.text.substr(row.source.size());
@@ -87,13 +92,15 @@ class ProgressWindow::DrawnList : public wxVListBox {
  private:
   static bool IsAboutFile(const Row& row) { return row.line.item.file >= 0 && !row.source.empty(); }
   bool HasPicture(const Row& row) const {
-    const ThumbnailPointer thumbnail = IsAboutFile(row) ? box_.thumbnails_.FindAny(row.source) : nullptr;
+    const ThumbnailPointer thumbnail =
+        IsAboutFile(row) ? box_.thumbnails_.FindAny(row.source) : nullptr;
     return thumbnail != nullptr && thumbnail->status == Status::Ok;
   }
   void DrawThumbnail(wxDC& dc, const Thumbnail& thumbnail, const wxRect& place) const {
     const wxBitmap bitmap = BitmapOf(thumbnail.pixels, GetContentScaleFactor());
     const wxSize size = bitmap.GetSize();
-    const double shrink = std::min(1.0, static_cast<double>(place.width) / std::max({size.x, size.y, 1}));
+    const double shrink =
+        std::min(1.0, static_cast<double>(place.width) / std::max({size.x, size.y, 1}));
     const wxPoint corner(place.x + static_cast<int>((place.width - size.x * shrink) / 2),
                          place.y + static_cast<int>((place.height - size.y * shrink) / 2));
     dc.SetUserScale(shrink, shrink);
@@ -108,14 +115,16 @@ class ProgressWindow::DrawnList : public wxVListBox {
 class ProgressWindow::PlainList : public wxListBox {
  public:
   PlainList(ProgressWindow& box, long style)
-      : wxListBox(box.panel_, kProgressListId, wxDefaultPosition, wxDefaultSize, 0, nullptr, style, wxDefaultValidator, Label("Files")) {
+      : wxListBox(box.panel_, kProgressListId, wxDefaultPosition, wxDefaultSize, 0, nullptr, style,
+                  wxDefaultValidator, Label("Files")) {
     for (const Row& row : box.rows_) Append(Shown(row.line.text));
   }
 };
 
 ProgressWindow::ProgressWindow(wxWindow* frame, ThumbnailService& thumbnails, Events events)
     : wxFrame(frame, wxID_ANY, kProgressTitle, wxDefaultPosition, wxDefaultSize,
-              wxCAPTION | wxRESIZE_BORDER | wxFRAME_FLOAT_ON_PARENT | wxFRAME_NO_TASKBAR, kProgressBoxClass),
+              wxCAPTION | wxRESIZE_BORDER | wxFRAME_FLOAT_ON_PARENT | wxFRAME_NO_TASKBAR,
+              kProgressBoxClass),
       events_(std::move(events)),
       thumbnails_(thumbnails),
       settings_(ProgressSettingsFromSettings()),
@@ -123,9 +132,10 @@ ProgressWindow::ProgressWindow(wxWindow* frame, ThumbnailService& thumbnails, Ev
       newsTimer_(this) {
   panel_ = new wxPanel(this);
   list_ = MakeList(false);
-  status_ =
-      new wxStaticText(panel_, kProgressStatusId, "", wxDefaultPosition, wxDefaultSize, wxST_NO_AUTORESIZE | wxST_ELLIPSIZE_END);
-  bar_ = new wxGauge(panel_, wxID_ANY, 1, wxDefaultPosition, wxDefaultSize, wxGA_HORIZONTAL | wxGA_SMOOTH, wxDefaultValidator,
+  status_ = new wxStaticText(panel_, kProgressStatusId, "", wxDefaultPosition, wxDefaultSize,
+                             wxST_NO_AUTORESIZE | wxST_ELLIPSIZE_END);
+  bar_ = new wxGauge(panel_, wxID_ANY, 1, wxDefaultPosition, wxDefaultSize,
+                     wxGA_HORIZONTAL | wxGA_SMOOTH, wxDefaultValidator,
                      Label("Progress of the batch"));
   abort_ = new wxButton(panel_, kProgressAbortId, Label("&Abort"));
   close_ = new wxButton(panel_, kProgressCloseId, Label("&Close"));
@@ -168,8 +178,11 @@ wxWindow* ProgressWindow::MakeList(bool scrollBar) {
   return plain_ = new PlainList(*this, scrollBar ? wxLB_ALWAYS_SB : 0);
 }
 
-// The box's geometry is in pixels of a screen of the usual resolution, with texts of the usual size.
-wxSize ProgressWindow::InUnits(const wxSize& pixels) const { return ToDIP(pixels) / TextScale(*this); }
+// The box's geometry is in pixels of a screen of the usual resolution, with texts of the usual
+// size.
+wxSize ProgressWindow::InUnits(const wxSize& pixels) const {
+  return ToDIP(pixels) / TextScale(*this);
+}
 
 wxRect ProgressWindow::InPixels(const Rectangle& units) const {
   const auto pixels = [this](int32_t length) { return TextWidth(*this, length); };
@@ -179,15 +192,19 @@ wxRect ProgressWindow::InPixels(const Rectangle& units) const {
 void ProgressWindow::LayOut() {
   const wxSize client = InUnits(panel_->GetClientSize());
   const ProgressLayout layout = LayOutProgressBox(client.x, client.y, settings_);
-  const auto put = [this](wxWindow* window, const Rectangle& place) { window->SetSize(InPixels(place)); };
+  const auto put = [this](wxWindow* window, const Rectangle& place) {
+    window->SetSize(InPixels(place));
+  };
   put(list_, layout.list);
   put(status_, layout.status);
   put(abort_, layout.abort);
   put(close_, layout.close);
   // The bar takes the gap between list and status line.
   const int32_t under = layout.list.y + layout.list.height;
-  put(bar_, {layout.list.x, under + 2, layout.list.width, std::max(layout.status.y - under - 4, 2)});
-  // The buttons for files that failed take the place of the one that stops, as wide as their texts where there is room.
+  put(bar_,
+      {layout.list.x, under + 2, layout.list.width, std::max(layout.status.y - under - 4, 2)});
+  // The buttons for files that failed take the place of the one that stops, as wide as their texts
+  // where there is room.
   const int gap = 4, room = layout.close.x - layout.list.x - 2 * gap;
   const int copy = InUnits(copy_->GetBestSize()).x, select = InUnits(select_->GetBestSize()).x;
   const int copyWidth = copy + select <= room ? copy : std::max(room * copy / (copy + select), 1);
@@ -242,20 +259,26 @@ void ProgressWindow::ShowNews() {
     drawn_->Refresh();
   }
   if (plain_ != nullptr && plain_->GetCount() != rows_.size()) {
-    for (size_t row = plain_->GetCount(); row < rows_.size(); ++row) plain_->Append(Shown(rows_[row].line.text));
+    for (size_t row = plain_->GetCount(); row < rows_.size(); ++row)
+      plain_->Append(Shown(rows_[row].line.text));
     plain_->EnsureVisible(static_cast<int>(rows_.size()) - 1);
   }
   bar_->SetRange(static_cast<int>(std::max(fileCount_, 1u)));
   bar_->SetValue(static_cast<int>(fileDone_));
   const double passed = platform::MonotonicSeconds() - started_;
-  const bool tells = passed >= kTimeLeftAfter && fileDone_ > 0 && fileDone_ < fileCount_ && abort_->IsEnabled();
-  const wxString left = tells ? TimeLeft(passed / fileDone_ * (fileCount_ - fileDone_)) : wxString();
+  const bool tells =
+      passed >= kTimeLeftAfter && fileDone_ > 0 && fileDone_ < fileCount_ && abort_->IsEnabled();
+  const wxString left =
+      tells ? TimeLeft(passed / fileDone_ * (fileCount_ - fileDone_)) : wxString();
   const wxString waiting =
-      waiting_ == 0 || done_ ? wxString() : ", " + LabelCount("%1 batch is waiting", "%1 batches are waiting", waiting_);
+      waiting_ == 0 || done_
+          ? wxString()
+          : ", " + LabelCount("%1 batch is waiting", "%1 batches are waiting", waiting_);
   status_->SetLabel(Shown(text_) + left + waiting);
 }
 
-// The list is made anew with a scroll bar that always shows, at the same place and with the same rows in sight.
+// The list is made anew with a scroll bar that always shows, at the same place and with the same
+// rows in sight.
 void ProgressWindow::StayOpen() {
   done_ = true;
   newsTimer_.Stop();
@@ -284,7 +307,8 @@ void ProgressWindow::StayOpen() {
 std::vector<std::string> ProgressWindow::FailedFiles() const {
   std::vector<std::string> files;
   for (const Row& row : rows_) {
-    if (row.line.item.status != Status::Ok && !row.line.item.skipped && !row.source.empty()) files.push_back(row.source);
+    if (row.line.item.status != Status::Ok && !row.line.item.skipped && !row.source.empty())
+      files.push_back(row.source);
   }
   return files;
 }

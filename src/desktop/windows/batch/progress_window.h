@@ -17,14 +17,17 @@ class wxVListBox;
 
 namespace fotomill::desktop {
 
-// The progress box: lists files as they are processed, with Abort while the batch runs and Close after it. Not modal.
+// The progress box: lists files as they are processed, with Abort while the batch runs and Close
+// after it. Not modal.
 class ProgressWindow : public wxFrame {
  public:
   // What the box tells its owner. They are called on the main thread.
   struct Events {
     std::function<void()> abort;
-    std::function<void(ProgressWindow& box)> closed;                          // the user is done with the box
-    std::function<void(const std::vector<std::string>& files)> selectFailed;  // shows the failed files in their browser
+    // the user is done with the box
+    std::function<void(ProgressWindow& box)> closed;
+    // shows the failed files in their browser
+    std::function<void(const std::vector<std::string>& files)> selectFailed;
   };
   ProgressWindow(wxWindow* frame, ThumbnailService& thumbnails, Events events);
 

@@ -15,13 +15,15 @@
 namespace fotomill::desktop {
 
 bool PromptForDestination(wxWindow& parent, const std::string& question) {
-  wxDialog dialog(&parent, wxID_ANY, Label("Destination"), wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE,
-                  "PromptForDestinationBox");
+  wxDialog dialog(&parent, wxID_ANY, Label("Destination"), wxDefaultPosition, wxDefaultSize,
+                  wxDEFAULT_DIALOG_STYLE, "PromptForDestinationBox");
   const int gap = dialog.FromDIP(12);
   auto* sizer = new wxBoxSizer(wxVERTICAL);
   auto* row = new wxBoxSizer(wxHORIZONTAL);
-  row->Add(new wxStaticBitmap(&dialog, wxID_ANY, wxArtProvider::GetBitmapBundle(wxART_QUESTION, wxART_MESSAGE_BOX)));
-  row->Add(new wxStaticText(&dialog, wxID_ANY, Shown(question)), wxSizerFlags(1).CenterVertical().Border(wxLEFT, gap));
+  row->Add(new wxStaticBitmap(&dialog, wxID_ANY,
+                              wxArtProvider::GetBitmapBundle(wxART_QUESTION, wxART_MESSAGE_BOX)));
+  row->Add(new wxStaticText(&dialog, wxID_ANY, Shown(question)),
+           wxSizerFlags(1).CenterVertical().Border(wxLEFT, gap));
   sizer->Add(row, wxSizerFlags().Expand().Border(wxALL, gap));
   auto* again = new wxCheckBox(&dialog, wxID_ANY, Label("&Ask this before every batch"));
   again->SetValue(true);
@@ -40,7 +42,8 @@ bool PromptForDestination(wxWindow& parent, const std::string& question) {
   if (dialog.ShowModal() != wxID_OK) return false;
   if (!again->GetValue()) {
     SettingValue off;
-    if (StoreSetting(KeyOf(KeyNumber::WarnDestinationWrite), off) != SaveResult::Done) settings.WarnDestinationWrite = 0;
+    if (StoreSetting(KeyOf(KeyNumber::WarnDestinationWrite), off) != SaveResult::Done)
+      settings.WarnDestinationWrite = 0;
   }
   return true;
 }

@@ -24,16 +24,21 @@ namespace fotomill::desktop {
 
 namespace {
 
-enum View { kThumbnailView, kDetailsView };  // pages of the book, the second made when it is first shown
+// pages of the book, the second made when it is first shown
+enum View { kThumbnailView, kDetailsView };
 
 }  // namespace
 
-BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& thumbnails, const FolderView& view)
-    : wxPanel(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTAB_TRAVERSAL | wxBORDER_NONE, "Browser"),
+BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& thumbnails,
+                         const FolderView& view)
+    : wxPanel(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTAB_TRAVERSAL | wxBORDER_NONE,
+              "Browser"),
       host_(host),
       thumbnails_(thumbnails),
       base_(view),
-      reader_({[this](FolderListing listing, bool complete) { ShowListing(std::move(listing), complete); },
+      reader_({[this](FolderListing listing, bool complete) {
+                 ShowListing(std::move(listing), complete);
+               },
                [this](const PlacedItems& found, bool last) { ShowFacts(found, last); }}),
       watch_([this] { Reload(); }),
       offer_(this, {[this] { FocusList(); }, [this] { canvas_->WantThumbnails(); }}) {
@@ -56,18 +61,19 @@ BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& 
   sizer->Add(offer_.Bar(), wxSizerFlags().Expand());
   sizer->Add(views_, wxSizerFlags(1).Expand());
   SetSizer(sizer);
-  SetDropTarget(new FolderDrop([this](const wxPoint&) { return model_.Folder(); },
-                               [this](const std::vector<std::string>& files, const std::string& folder, bool move) {
-                                 host_.DropFiles(files, folder, move);
-                               }));
+  SetDropTarget(
+      new FolderDrop([this](const wxPoint&) { return model_.Folder(); },
+                     [this](const std::vector<std::string>& files, const std::string& folder,
+                            bool move) { host_.DropFiles(files, folder, move); }));
 }
 
 void BrowserPage::BuildFilter() {
-  filter_ = new wxSearchCtrl(this, wxID_ANY, "", wxDefaultPosition, FromDIP(wxSize(200, -1)), wxTE_PROCESS_ENTER,
-                             wxDefaultValidator, Label("Filter"));
+  filter_ = new wxSearchCtrl(this, wxID_ANY, "", wxDefaultPosition, FromDIP(wxSize(200, -1)),
+                             wxTE_PROCESS_ENTER, wxDefaultValidator, Label("Filter"));
   filter_->SetDescriptiveText(Label("Filter"));
   filter_->ShowCancelButton(true);
-  filter_->SetToolTip(Label("Shows only files whose names contain this text or match this pattern (*, ?)"));
+  filter_->SetToolTip(
+      Label("Shows only files whose names contain this text or match this pattern (*, ?)"));
   filter_->Bind(wxEVT_TEXT, [this](wxCommandEvent&) { ApplyFilter(); });
   filter_->Bind(wxEVT_SEARCHCTRL_CANCEL_BTN, [this](wxCommandEvent&) { filter_->Clear(); });
   filter_->Bind(wxEVT_TEXT_ENTER, [this](wxCommandEvent&) { FocusList(); });
@@ -82,10 +88,14 @@ void BrowserPage::BuildViews() {
   ThumbnailCanvas::Events events;
   events.selectionChanged = [this] { host_.BrowserChanged(); };
   events.activated = [this](size_t line) { Activate(line); };
-  events.contextMenu = [this](size_t line, const wxPoint& place) { host_.ShowContextMenu(*canvas_, place, line != kNoLine); };
+  events.contextMenu = [this](size_t line, const wxPoint& place) {
+    host_.ShowContextMenu(*canvas_, place, line != kNoLine);
+  };
   events.dragBegins = [this] { BeginDrag(); };
   events.resize = [this](int steps) { ChangeSize(steps); };
-  events.renamed = [this](size_t line, const std::string& name) { host_.RenameFile(model_.PathOfLine(line), name); };
+  events.renamed = [this](size_t line, const std::string& name) {
+    host_.RenameFile(model_.PathOfLine(line), name);
+  };
   canvas_ = new ThumbnailCanvas(views_, model_, thumbnails_, events);
   views_->AddPage(canvas_, Label("Thumbnails"));
 }
@@ -123,7 +133,8 @@ void BrowserPage::ShowFolder(const std::string& folder, const std::string& focus
   host_.BrowserChanged();
 }
 
-// How the folder was last asked to be shown, else as all folders are here; what the folder itself says wins, and continues.
+// How the folder was last asked to be shown, else as all folders are here; what the folder itself
+// says wins, and continues.
 void BrowserPage::UseViewOf(const std::string& folder) {
   const FolderView kept = host_.Views().Find(folder, base_);
   FolderView view = kept;
@@ -142,7 +153,8 @@ void BrowserPage::ShowListing(FolderListing listing, bool complete) {
     const size_t line = model_.FindLine(wantedFocus_);
     if (line != kNoLine) model_.Selected().SelectOnly(line);
   }
-  if (model_.Selected().Focus() == kNoLine && model_.LineCount() > 0) model_.Selected().MoveFocus(0, false, true);
+  if (model_.Selected().Focus() == kNoLine && model_.LineCount() > 0)
+    model_.Selected().MoveFocus(0, false, true);
   ShowLines();
   if (!ShowsDetails()) {
     if (wantedScroll_ >= 0) canvas_->ScrollTo(wantedScroll_);
@@ -171,7 +183,8 @@ void BrowserPage::OfferThumbnails() {
 
 bool BrowserPage::NeedsFacts() const {
   const BrowserModes& modes = model_.Modes();
-  return modes.view == choice::kViewDetails || modes.sort == choice::kSortExifDate || modes.sort == choice::kSortDimensions;
+  return modes.view == choice::kViewDetails || modes.sort == choice::kSortExifDate ||
+         modes.sort == choice::kSortDimensions;
 }
 
 void BrowserPage::StartFacts() {
@@ -179,7 +192,8 @@ void BrowserPage::StartFacts() {
   PlacedItems wanted;
   for (size_t line = 0; line < model_.LineCount(); ++line) {
     const size_t item = model_.ItemOfLine(line);
-    if (!model_.Item(item).folder && model_.Item(item).width == 0) wanted.emplace_back(item, model_.Item(item));
+    if (!model_.Item(item).folder && model_.Item(item).width == 0)
+      wanted.emplace_back(item, model_.Item(item));
   }
   if (!wanted.empty()) reader_.ReadFacts(model_.Folder(), std::move(wanted));
 }
@@ -206,8 +220,12 @@ void BrowserPage::ShowView() {
     DetailsList::Events events;
     events.selectionChanged = [this] { host_.BrowserChanged(); };
     events.activated = [this](size_t line) { Activate(line); };
-    events.contextMenu = [this](size_t line, const wxPoint& place) { host_.ShowContextMenu(*details_, place, line != kNoLine); };
-    events.sort = [this](int32_t sort) { SetSort(sort, model_.Modes().sort == sort && !model_.Descending()); };
+    events.contextMenu = [this](size_t line, const wxPoint& place) {
+      host_.ShowContextMenu(*details_, place, line != kNoLine);
+    };
+    events.sort = [this](int32_t sort) {
+      SetSort(sort, model_.Modes().sort == sort && !model_.Descending());
+    };
     details_ = new DetailsList(views_, model_, host_.Columns(), events);
     views_->AddPage(details_, Label("Details"));
   }
@@ -264,7 +282,8 @@ void BrowserPage::SetThumbnailMode(int32_t mode) {
 }
 
 void BrowserPage::ChangeSize(int steps) {
-  const int32_t view = std::clamp(model_.Modes().view + steps, choice::kViewList + 0, choice::kViewLarge + 0);
+  const int32_t view =
+      std::clamp(model_.Modes().view + steps, choice::kViewList + 0, choice::kViewLarge + 0);
   if (view != model_.Modes().view) SetViewMode(view);
 }
 
@@ -289,8 +308,10 @@ void BrowserPage::EditFocusedName() {
   const size_t focus = model_.Selected().Focus();
   if (focus == kNoLine) return;
   if (!ShowsDetails()) return canvas_->EditName(focus);
-  wxTextEntryDialog dialog(this, Label("New name:"), Label("Rename"), Shown(model_.Line(focus).name));
-  if (dialog.ShowModal() == wxID_OK) host_.RenameFile(model_.PathOfLine(focus), Utf8(dialog.GetValue()));
+  wxTextEntryDialog dialog(this, Label("New name:"), Label("Rename"),
+                           Shown(model_.Line(focus).name));
+  if (dialog.ShowModal() == wxID_OK)
+    host_.RenameFile(model_.PathOfLine(focus), Utf8(dialog.GetValue()));
 }
 
 void BrowserPage::EditPath() { path_->Edit(); }
@@ -319,7 +340,8 @@ void BrowserPage::LeaveBar() {
 }
 
 void BrowserPage::Activated() {
-  thumbnails_.SetListener([this](const std::vector<ThumbnailLoader::Result>& results) { ThumbnailsCame(results); });
+  thumbnails_.SetListener(
+      [this](const std::vector<ThumbnailLoader::Result>& results) { ThumbnailsCame(results); });
   canvas_->WantThumbnails();
   if (details_ != nullptr) details_->ShowColumns();
 }
@@ -337,7 +359,9 @@ void BrowserPage::FocusList() {
   }
 }
 
-size_t BrowserPage::MissingThumbnails() const { return ShowsDetails() ? 0 : canvas_->MissingThumbnails(); }
+size_t BrowserPage::MissingThumbnails() const {
+  return ShowsDetails() ? 0 : canvas_->MissingThumbnails();
+}
 int64_t BrowserPage::Scroll() const { return canvas_->Scroll(); }
 
 void BrowserPage::Activate(size_t line) {

@@ -38,14 +38,16 @@ class BrowserHost {
   // `name` without a folder.
   virtual void RenameFile(const std::string& path, const std::string& name) = 0;
   // `move`: else they are copied.
-  virtual void DropFiles(const std::vector<std::string>& files, const std::string& folder, bool move) = 0;
+  virtual void DropFiles(const std::vector<std::string>& files, const std::string& folder,
+                         bool move) = 0;
 };
 
 // One browser: the contents of a tab. Shows a folder as thumbnails, names or details.
 class BrowserPage : public wxPanel {
  public:
   // Host and thumbnails must outlive it.
-  BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& thumbnails, const FolderView& view);
+  BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& thumbnails,
+              const FolderView& view);
 
   // Goes to a folder; `focus` is the name that gets the focus once it is listed.
   void Open(const std::string& folder, const std::string& focus = {});

@@ -21,16 +21,19 @@ constexpr int kWidestName = 220;  // device-independent pixels
 wxString CutName(const wxString& name, const wxWindow& window) {
   wxMemoryDC dc;
   dc.SetFont(window.GetFont());
-  return wxControl::Ellipsize(name, dc, wxELLIPSIZE_MIDDLE, window.FromDIP(kWidestName), wxELLIPSIZE_FLAGS_NONE);
+  return wxControl::Ellipsize(name, dc, wxELLIPSIZE_MIDDLE, window.FromDIP(kWidestName),
+                              wxELLIPSIZE_FLAGS_NONE);
 }
 
 }  // namespace
 
 CrumbStrip::CrumbStrip(wxWindow* parent, Events events)
-    : wxPanel(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTAB_TRAVERSAL | wxBORDER_NONE, "Folders on the way"),
+    : wxPanel(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTAB_TRAVERSAL | wxBORDER_NONE,
+              "Folders on the way"),
       events_(std::move(events)) {
-  more_ = new wxButton(this, wxID_ANY, wxString::FromUTF8("\u2026"), wxDefaultPosition, wxDefaultSize,
-                       wxBU_EXACTFIT | wxBORDER_NONE, wxDefaultValidator, Label("Parent folders"));
+  more_ =
+      new wxButton(this, wxID_ANY, wxString::FromUTF8("\u2026"), wxDefaultPosition, wxDefaultSize,
+                   wxBU_EXACTFIT | wxBORDER_NONE, wxDefaultValidator, Label("Parent folders"));
   more_->SetToolTip(Label("Parent folders"));
   more_->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { OfferHidden(); });
   SetMinSize(wxSize(FromDIP(60), more_->GetBestSize().y));
@@ -57,14 +60,17 @@ void CrumbStrip::Build() {
   for (size_t i = 0; i < places_.size(); ++i) {
     Place& place = places_[i];
     const wxString name = Shown(place.crumb.label);
-    place.button = new wxButton(this, wxID_ANY, wxControl::EscapeMnemonics(CutName(name, *this)), wxDefaultPosition,
-                                wxDefaultSize, wxBU_EXACTFIT | wxBORDER_NONE, wxDefaultValidator, name);
+    place.button = new wxButton(this, wxID_ANY, wxControl::EscapeMnemonics(CutName(name, *this)),
+                                wxDefaultPosition, wxDefaultSize, wxBU_EXACTFIT | wxBORDER_NONE,
+                                wxDefaultValidator, name);
     if (i + 1 == places_.size()) place.button->SetFont(place.button->GetFont().Bold());
     place.button->SetToolTip(Shown(place.crumb.folder));
-    place.button->Bind(wxEVT_BUTTON, [this, folder = place.crumb.folder](wxCommandEvent&) { OpenLater(folder); });
+    place.button->Bind(wxEVT_BUTTON,
+                       [this, folder = place.crumb.folder](wxCommandEvent&) { OpenLater(folder); });
     const wxString tip = Label("Folders in %1", name);
-    place.below = new wxBitmapButton(this, wxID_ANY, Symbol("below", 10), wxDefaultPosition, wxDefaultSize,
-                                     wxBU_EXACTFIT | wxBORDER_NONE, wxDefaultValidator, tip);
+    place.below =
+        new wxBitmapButton(this, wxID_ANY, Symbol("below", 10), wxDefaultPosition, wxDefaultSize,
+                           wxBU_EXACTFIT | wxBORDER_NONE, wxDefaultValidator, tip);
     place.below->SetToolTip(tip);
     place.below->Bind(wxEVT_BUTTON, [this, i](wxCommandEvent&) { ListBelow(i); });
   }
@@ -72,7 +78,8 @@ void CrumbStrip::Build() {
 
 void CrumbStrip::LayOut() {
   std::vector<int> widths;
-  for (const Place& place : places_) widths.push_back(place.button->GetBestSize().x + place.below->GetBestSize().x);
+  for (const Place& place : places_)
+    widths.push_back(place.button->GetBestSize().x + place.below->GetBestSize().x);
   const int height = GetClientSize().y;
   const wxSize more = more_->GetBestSize();
   firstShown_ = FirstCrumbShown(widths, GetClientSize().x, more.x);
@@ -94,15 +101,18 @@ void CrumbStrip::LayOut() {
 }
 
 void CrumbStrip::ListBelow(size_t place) {
-  listing_.Start([this, place, folder = places_[place].crumb.folder](const StopToken&, const LooseWork::Report& report) {
+  listing_.Start([this, place, folder = places_[place].crumb.folder](
+                     const StopToken&, const LooseWork::Report& report) {
     report([this, place, names = SubfolderNames(folder)] { OfferBelow(place, names); });
   });
 }
 
 void CrumbStrip::OfferBelow(size_t place, const std::vector<std::string>& names) {
   std::vector<Crumb> below;
-  for (const std::string& name : names) below.push_back({name, platform::JoinFolder(places_[place].crumb.folder, name)});
-  const std::string current = place + 1 < places_.size() ? places_[place + 1].crumb.folder : std::string();
+  for (const std::string& name : names)
+    below.push_back({name, platform::JoinFolder(places_[place].crumb.folder, name)});
+  const std::string current =
+      place + 1 < places_.size() ? places_[place + 1].crumb.folder : std::string();
   const auto chosen = ChooseFolderFromMenu(*places_[place].below, below, current);
   if (chosen) OpenLater(below[*chosen].folder);
 }

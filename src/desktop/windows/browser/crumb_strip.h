@@ -13,7 +13,8 @@ class wxButton;
 
 namespace fotomill::desktop {
 
-// The way to a folder: a button for each folder on it, and behind each a button that lists the folders in it.
+// The way to a folder: a button for each folder on it, and behind each a button that lists the
+// folders in it.
 class CrumbStrip : public wxPanel {
  public:
   // What the user did in it.

@@ -15,7 +15,8 @@ class DetailsList::Lines : public wxDataViewVirtualListModel {
   unsigned int GetColumnCount() const { return static_cast<unsigned>(AllDetails().size()); }
   wxString GetColumnType(unsigned int) const { return "string"; }
   void GetValueByRow(wxVariant& value, unsigned int row, unsigned int column) const override {
-    value = row < model_.LineCount() ? Shown(AllDetails()[column].text(model_.Line(row))) : wxString();
+    value =
+        row < model_.LineCount() ? Shown(AllDetails()[column].text(model_.Line(row))) : wxString();
   }
   bool SetValueByRow(const wxVariant&, unsigned int, unsigned int) override { return false; }
 
@@ -23,9 +24,11 @@ class DetailsList::Lines : public wxDataViewVirtualListModel {
   const BrowserModel& model_;
 };
 
-DetailsList::DetailsList(wxWindow* parent, BrowserModel& model, DetailColumns& columns, Events events)
-    : wxDataViewCtrl(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxDV_MULTIPLE | wxDV_ROW_LINES | wxBORDER_NONE,
-                     wxDefaultValidator, Label("Details")),
+DetailsList::DetailsList(wxWindow* parent, BrowserModel& model, DetailColumns& columns,
+                         Events events)
+    : wxDataViewCtrl(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize,
+                     wxDV_MULTIPLE | wxDV_ROW_LINES | wxBORDER_NONE, wxDefaultValidator,
+                     Label("Details")),
       model_(model),
       columns_(columns),
       events_(std::move(events)),
@@ -44,7 +47,8 @@ DetailsList::DetailsList(wxWindow* parent, BrowserModel& model, DetailColumns& c
     const int32_t sort = AllDetails()[event.GetDataViewColumn()->GetModelColumn()].sort;
     if (sort >= 0) events_.sort(sort);
   });
-  Bind(wxEVT_DATAVIEW_COLUMN_HEADER_RIGHT_CLICK, [this](wxDataViewEvent&) { CallAfter([this] { ChooseColumns(); }); });
+  Bind(wxEVT_DATAVIEW_COLUMN_HEADER_RIGHT_CLICK,
+       [this](wxDataViewEvent&) { CallAfter([this] { ChooseColumns(); }); });
 }
 
 // --- columns ---
@@ -55,9 +59,10 @@ void DetailsList::ShowColumns() {
   for (const DetailColumn& column : columns_) {
     const DetailFacts& facts = AllDetails()[column.detail];
     const wxAlignment alignment = facts.number ? wxALIGN_RIGHT : wxALIGN_LEFT;
-    auto* added = new wxDataViewColumn(Label(facts.title), new wxDataViewTextRenderer("string", wxDATAVIEW_CELL_INERT, alignment),
-                                       static_cast<unsigned>(column.detail), FromDIP(column.width), alignment,
-                                       wxDATAVIEW_COL_RESIZABLE | wxDATAVIEW_COL_REORDERABLE);
+    auto* added = new wxDataViewColumn(
+        Label(facts.title), new wxDataViewTextRenderer("string", wxDATAVIEW_CELL_INERT, alignment),
+        static_cast<unsigned>(column.detail), FromDIP(column.width), alignment,
+        wxDATAVIEW_COL_RESIZABLE | wxDATAVIEW_COL_REORDERABLE);
     added->SetHidden(!column.shown);
     AppendColumn(added);
   }
@@ -72,11 +77,14 @@ void DetailsList::KeepColumns() {
     const auto before = std::ranges::find(shown_, detail, &DetailColumn::detail);
     // A hidden column has no width, and the last one shown fills the list up.
     const bool measured = column->IsShown() && column->GetWidth() > 0;
-    now.push_back({detail, measured ? ToDIP(column->GetWidth()) : before->width, column->IsShown()});
+    now.push_back(
+        {detail, measured ? ToDIP(column->GetWidth()) : before->width, column->IsShown()});
   }
   if (now.size() != shown_.size()) return;
-  const auto last = std::find_if(now.rbegin(), now.rend(), [](const DetailColumn& column) { return column.shown; });
-  if (last != now.rend()) last->width = std::ranges::find(shown_, last->detail, &DetailColumn::detail)->width;
+  const auto last = std::find_if(now.rbegin(), now.rend(),
+                                 [](const DetailColumn& column) { return column.shown; });
+  if (last != now.rend())
+    last->width = std::ranges::find(shown_, last->detail, &DetailColumn::detail)->width;
   columns_ = shown_ = now;
 }
 
@@ -85,14 +93,16 @@ void DetailsList::ChooseColumns() {
   const int first = wxID_HIGHEST + 1;
   KeepColumns();
   for (const DetailColumn& column : columns_) {
-    wxMenuItem* item = menu.AppendCheckItem(first + static_cast<int>(column.detail), Label(AllDetails()[column.detail].title));
+    wxMenuItem* item = menu.AppendCheckItem(first + static_cast<int>(column.detail),
+                                            Label(AllDetails()[column.detail].title));
     item->Check(column.shown);
     item->Enable(column.detail != 0);
   }
   LogEvent("column-menu");
   const int chosen = GetPopupMenuSelectionFromUser(menu, ScreenToClient(wxGetMousePosition()));
   if (chosen < first) return;
-  const auto column = std::ranges::find(columns_, static_cast<size_t>(chosen - first), &DetailColumn::detail);
+  const auto column =
+      std::ranges::find(columns_, static_cast<size_t>(chosen - first), &DetailColumn::detail);
   column->shown = !column->shown;
   ShowColumns();
   ModelChanged();
@@ -121,12 +131,14 @@ void DetailsList::ModelChanged() {
 void DetailsList::ShowSelection() {
   changing_ = true;
   wxDataViewItemArray items;
-  for (const size_t line : model_.Selected().SelectedLines()) items.Add(lines_->GetItem(static_cast<unsigned>(line)));
+  for (const size_t line : model_.Selected().SelectedLines())
+    items.Add(lines_->GetItem(static_cast<unsigned>(line)));
   SetSelections(items);
   const size_t focus = model_.Selected().Focus();
   if (focus != kNoLine) {
     const wxDataViewItem item = lines_->GetItem(static_cast<unsigned>(focus));
-    if (model_.Selected().SelectedCount() <= 1 && model_.Selected().IsSelected(focus)) SetCurrentItem(item);
+    if (model_.Selected().SelectedCount() <= 1 && model_.Selected().IsSelected(focus))
+      SetCurrentItem(item);
     EnsureVisible(item);
   }
   changing_ = false;

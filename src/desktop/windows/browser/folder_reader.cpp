@@ -10,44 +10,49 @@ constexpr size_t kBunch = 200;
 
 void FolderReader::List(const std::string& folder, bool namesFirst) {
   facts_.Stop();
-  listing_.Start([this, folder, namesFirst](const StopToken& stop, const LooseWork::Report& report) {
-    const auto send = [&](FolderListing listing, bool complete) {
-      report([this, listing = std::move(listing), complete]() mutable {
-        if (complete) listing_.Stop();
-        events_.listed(std::move(listing), complete);
+  listing_.Start(
+      [this, folder, namesFirst](const StopToken& stop, const LooseWork::Report& report) {
+        const auto send = [&](FolderListing listing, bool complete) {
+          report([this, listing = std::move(listing), complete]() mutable {
+            if (complete) listing_.Stop();
+            events_.listed(std::move(listing), complete);
+          });
+        };
+        FolderListing listing = ListForBrowser(folder, false, stop);
+        if (namesFirst && !stop.Asked()) send(listing, false);
+        AddFacts(folder, listing, stop);
+        if (!stop.Asked()) send(std::move(listing), true);
+      },
+      [this] {
+        listing_.Stop();
+        events_.listed({}, true);  // as a folder that cannot be read
       });
-    };
-    FolderListing listing = ListForBrowser(folder, false, stop);
-    if (namesFirst && !stop.Asked()) send(listing, false);
-    AddFacts(folder, listing, stop);
-    if (!stop.Asked()) send(std::move(listing), true);
-  }, [this] {
-    listing_.Stop();
-    events_.listed({}, true);  // as a folder that cannot be read
-  });
 }
 
 void FolderReader::ReadFacts(const std::string& folder, PlacedItems wanted) {
-  facts_.Start([this, folder, wanted = std::move(wanted)](const StopToken& stop, const LooseWork::Report& report) {
-    const auto send = [&](PlacedItems found, bool last) {
-      report([this, found = std::move(found), last] {
-        if (last) facts_.Stop();
-        events_.factsFound(found, last);
+  facts_.Start(
+      [this, folder, wanted = std::move(wanted)](const StopToken& stop,
+                                                 const LooseWork::Report& report) {
+        const auto send = [&](PlacedItems found, bool last) {
+          report([this, found = std::move(found), last] {
+            if (last) facts_.Stop();
+            events_.factsFound(found, last);
+          });
+        };
+        PlacedItems found;
+        for (const auto& [place, item] : wanted) {
+          if (stop.Asked()) return;
+          FolderItem facts = item;
+          AddPictureFacts(folder, facts);
+          if (facts.width > 0) found.emplace_back(place, std::move(facts));
+          if (found.size() == kBunch) send(std::exchange(found, {}), false);
+        }
+        send(std::move(found), true);
+      },
+      [this] {
+        facts_.Stop();
+        events_.factsFound({}, true);
       });
-    };
-    PlacedItems found;
-    for (const auto& [place, item] : wanted) {
-      if (stop.Asked()) return;
-      FolderItem facts = item;
-      AddPictureFacts(folder, facts);
-      if (facts.width > 0) found.emplace_back(place, std::move(facts));
-      if (found.size() == kBunch) send(std::exchange(found, {}), false);
-    }
-    send(std::move(found), true);
-  }, [this] {
-    facts_.Stop();
-    events_.factsFound({}, true);
-  });
 }
 
 }  // namespace fotomill::desktop

@@ -13,7 +13,8 @@ namespace fotomill::desktop {
 // Items by their place in the list that they were taken from.
 using PlacedItems = std::vector<std::pair<size_t, FolderItem>>;
 
-// Reads a browser's folder apart from the window: what is in it, and what only the headers of files tell.
+// Reads a browser's folder apart from the window: what is in it, and what only the headers of files
+// tell.
 class FolderReader {
  public:
   // Called on the window's thread, never after the reader has gone.
@@ -23,11 +24,12 @@ class FolderReader {
   };
   explicit FolderReader(Events events) : events_(std::move(events)) {}
 
-  // Lists a folder. With `namesFirst` the names come at once and sizes and times in a second, complete list, so that even a
-  // folder of 100,000 files is shown at once.
+  // Lists a folder. With `namesFirst` the names come at once and sizes and times in a second,
+  // complete list, so that even a folder of 100,000 files is shown at once.
   void List(const std::string& folder, bool namesFirst);
   bool Listing() const { return listing_.Started(); }
-  // Reads the headers of items; those that told something come in bunches. Ends with the next listing.
+  // Reads the headers of items; those that told something come in bunches. Ends with the next
+  // listing.
   void ReadFacts(const std::string& folder, PlacedItems wanted);
   bool ReadingFacts() const { return facts_.Started(); }
 

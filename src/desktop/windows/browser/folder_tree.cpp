@@ -38,7 +38,8 @@ struct FolderTree::Place {
 
 FolderTree::FolderTree(wxWindow* parent, const Favourites& favourites, Events events)
     : wxTreeCtrl(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize,
-                 wxTR_HAS_BUTTONS | wxTR_HIDE_ROOT | wxTR_LINES_AT_ROOT | wxTR_NO_LINES | wxTR_FULL_ROW_HIGHLIGHT | wxBORDER_NONE,
+                 wxTR_HAS_BUTTONS | wxTR_HIDE_ROOT | wxTR_LINES_AT_ROOT | wxTR_NO_LINES |
+                     wxTR_FULL_ROW_HIGHLIGHT | wxBORDER_NONE,
                  wxDefaultValidator, Label("Folders")),
       favourites_(favourites),
       events_(std::move(events)) {
@@ -62,13 +63,15 @@ FolderTree::FolderTree(wxWindow* parent, const Favourites& favourites, Events ev
     followed_ = folder;
     events_.chosen(folder);
   });
-  Bind(wxEVT_TREE_ITEM_MENU, [this](wxTreeEvent& event) { ShowMenu(event.GetItem(), event.GetPoint()); });
+  Bind(wxEVT_TREE_ITEM_MENU,
+       [this](wxTreeEvent& event) { ShowMenu(event.GetItem(), event.GetPoint()); });
 }
 
 // In the color of texts.
 void FolderTree::LoadImages() {
   wxVector<wxBitmapBundle> images;
-  for (const char* symbol : {"folder", "home", "favourite", "volume"}) images.push_back(Symbol(symbol));
+  for (const char* symbol : {"folder", "home", "favourite", "volume"})
+    images.push_back(Symbol(symbol));
   SetImages(images);
 }
 
@@ -83,7 +86,8 @@ std::vector<FolderTree::Place> FolderTree::Places() const {
   const std::string home = platform::SpecialFolderPath(platform::SpecialFolder::Home);
   const std::string pictures = platform::SpecialFolderPath(platform::SpecialFolder::Pictures);
   if (!home.empty()) places.push_back({kHomeImage, Label("Home"), home});
-  if (!pictures.empty() && pictures != home) places.push_back({kFolderImage, Label("Pictures"), pictures});
+  if (!pictures.empty() && pictures != home)
+    places.push_back({kFolderImage, Label("Pictures"), pictures});
   for (const std::string& folder : platform::UserVolumes()) {
     places.push_back({kVolumeImage, Shown(platform::FileNameOf(folder)), folder});
   }
@@ -98,19 +102,21 @@ void FolderTree::UpdatePlaces() {
     return FolderOf(item) == place.folder && GetItemImage(item) == place.image;
   };
   for (const wxTreeItemId& item : ChildrenOf(GetRootItem())) {
-    if (std::ranges::none_of(places, [&](const Place& place) { return shows(item, place); })) Delete(item);
+    if (std::ranges::none_of(places, [&](const Place& place) { return shows(item, place); }))
+      Delete(item);
   }
   size_t at = 0;
   for (const wxTreeItemId& item : ChildrenOf(GetRootItem())) {
     for (; at < places.size() && !shows(item, places[at]); ++at) {
-      const wxTreeItemId added =
-          InsertItem(GetRootItem(), at, places[at].label, places[at].image, -1, new FolderData(places[at].folder));
+      const wxTreeItemId added = InsertItem(GetRootItem(), at, places[at].label, places[at].image,
+                                            -1, new FolderData(places[at].folder));
       SetItemHasChildren(added);
     }
     ++at;
   }
   for (; at < places.size(); ++at) {
-    SetItemHasChildren(AppendItem(GetRootItem(), places[at].label, places[at].image, -1, new FolderData(places[at].folder)));
+    SetItemHasChildren(AppendItem(GetRootItem(), places[at].label, places[at].image, -1,
+                                  new FolderData(places[at].folder)));
   }
   following_ = false;
 }
@@ -118,7 +124,8 @@ void FolderTree::UpdatePlaces() {
 std::vector<wxTreeItemId> FolderTree::ChildrenOf(const wxTreeItemId& item) const {
   std::vector<wxTreeItemId> children;
   wxTreeItemIdValue cookie;
-  for (wxTreeItemId child = GetFirstChild(item, cookie); child.IsOk(); child = GetNextChild(item, cookie))
+  for (wxTreeItemId child = GetFirstChild(item, cookie); child.IsOk();
+       child = GetNextChild(item, cookie))
     children.push_back(child);
   return children;
 }
@@ -166,18 +173,21 @@ void FolderTree::Read(std::vector<std::string> folders) {
 }
 
 void FolderTree::ShowNames(const std::string& folder, const std::vector<std::string>& names) {
-  // A folder may hang in the tree more than once: under a place of its own and under the file system.
+  // A folder may hang in the tree more than once: under a place of its own and under the file
+  // system.
   for (const wxTreeItemId& place : ChildrenOf(GetRootItem())) {
     wxTreeItemId item = place;
     while (item.IsOk() && FolderOf(item) != folder) item = FindChild(item, folder);
-    if (item.IsOk() && static_cast<FolderData*>(GetItemData(item))->filled) MergeNames(item, folder, names);
+    if (item.IsOk() && static_cast<FolderData*>(GetItemData(item))->filled)
+      MergeNames(item, folder, names);
   }
   opening_.erase(folder);
   FollowOn();
 }
 
 // Folders that are still there stay as they are, open or not.
-void FolderTree::MergeNames(const wxTreeItemId& item, const std::string& folder, const std::vector<std::string>& names) {
+void FolderTree::MergeNames(const wxTreeItemId& item, const std::string& folder,
+                            const std::vector<std::string>& names) {
   following_ = true;
   const std::set<std::string> there(names.begin(), names.end());
   for (const wxTreeItemId& child : ChildrenOf(item)) {
@@ -188,7 +198,8 @@ void FolderTree::MergeNames(const wxTreeItemId& item, const std::string& folder,
   for (size_t at = 0; at < names.size(); ++at) {
     std::string path = platform::JoinFolder(folder, names[at]);
     if (shown.contains(path)) continue;
-    SetItemHasChildren(InsertItem(item, at, Shown(names[at]), kFolderImage, -1, new FolderData(std::move(path))));
+    SetItemHasChildren(
+        InsertItem(item, at, Shown(names[at]), kFolderImage, -1, new FolderData(std::move(path))));
   }
   SetItemHasChildren(item, !names.empty());
   if (opening_.contains(folder) && !names.empty()) Expand(item);
@@ -207,7 +218,9 @@ wxTreeItemId FolderTree::FindChild(const wxTreeItemId& item, const std::string& 
 wxTreeItemId FolderTree::NearestItem(const std::string& folder) const {
   wxTreeItemId item;
   for (const wxTreeItemId& place : ChildrenOf(GetRootItem())) {
-    if (LiesIn(folder, FolderOf(place)) && (!item.IsOk() || FolderOf(place).size() > FolderOf(item).size())) item = place;
+    if (LiesIn(folder, FolderOf(place)) &&
+        (!item.IsOk() || FolderOf(place).size() > FolderOf(item).size()))
+      item = place;
   }
   while (item.IsOk() && FolderOf(item) != folder) {
     const wxTreeItemId child = FindChild(item, folder);
@@ -251,7 +264,9 @@ void FolderTree::ShowMenu(const wxTreeItemId& item, const wxPoint& point) {
   wxMenuItem* const rename = menu.Append(wxID_ANY, Label("&Rename..."));
   rename->Enable(named);
   menu.AppendSeparator();
-  const int toggle = menu.Append(wxID_ANY, favourites_.Has(folder) ? Label("Remove from &favorites") : Label("Add to &favorites"))->GetId();
+  const int toggle = menu.Append(wxID_ANY, favourites_.Has(folder) ? Label("Remove from &favorites")
+                                                                   : Label("Add to &favorites"))
+                         ->GetId();
   LogEvent("tree-menu", folder);
   const int chosen = GetPopupMenuSelectionFromUser(menu, point);
   if (chosen == open) events_.chosen(folder);

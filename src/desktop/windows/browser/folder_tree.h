@@ -13,8 +13,8 @@
 
 namespace fotomill::desktop {
 
-// The folders at the left of the frame: the user's favourites, home, pictures, mounted volumes and the root of the file system.
-// Folders are read when they open, on a thread of their own.
+// The folders at the left of the frame: the user's favourites, home, pictures, mounted volumes and
+// the root of the file system. Folders are read when they open, on a thread of their own.
 class FolderTree : public wxTreeCtrl {
  public:
   // What the user did in it.
@@ -46,11 +46,13 @@ class FolderTree : public wxTreeCtrl {
   void Fill(const wxTreeItemId& item);
   void Read(std::vector<std::string> folders);
   void ShowNames(const std::string& folder, const std::vector<std::string>& names);
-  void MergeNames(const wxTreeItemId& item, const std::string& folder, const std::vector<std::string>& names);
+  void MergeNames(const wxTreeItemId& item, const std::string& folder,
+                  const std::vector<std::string>& names);
   // Goes on along the way to the followed folder as far as folders have been read.
   void FollowOn();
   wxTreeItemId FindChild(const wxTreeItemId& item, const std::string& folder) const;
-  // The place at the top from which the way to a folder goes, and the item furthest along it that is there.
+  // The place at the top from which the way to a folder goes, and the item furthest along it that
+  // is there.
   wxTreeItemId NearestItem(const std::string& folder) const;
   void ShowMenu(const wxTreeItemId& item, const wxPoint& point);
   void AskForName(const std::string& folder);
@@ -58,9 +60,12 @@ class FolderTree : public wxTreeCtrl {
   const Favourites& favourites_;
   const Events events_;
   std::string followed_;
-  std::set<std::string> opening_;                                     // folders that open once they have been read
-  bool following_ = false;                                            // what is marked was not chosen by the user
-  const std::shared_ptr<bool> alive_ = std::make_shared<bool>(true);  // for threads that outlive the window
+  // folders that open once they have been read
+  std::set<std::string> opening_;
+  // what is marked was not chosen by the user
+  bool following_ = false;
+  // for threads that outlive the window
+  const std::shared_ptr<bool> alive_ = std::make_shared<bool>(true);
 };
 
 }  // namespace fotomill::desktop

@@ -13,11 +13,13 @@ constexpr int kGatherMs = 300;  // changes are gathered for so long
 
 }  // namespace
 
-FolderWatch::FolderWatch(std::function<void()> changed) : changed_(std::move(changed)), gather_(this) {
+FolderWatch::FolderWatch(std::function<void()> changed)
+    : changed_(std::move(changed)), gather_(this) {
   Bind(wxEVT_TIMER, [this](wxTimerEvent&) { changed_(); });
   Bind(wxEVT_FSWATCHER, [this](wxFileSystemWatcherEvent& event) {
     constexpr int kNoChange = wxFSW_EVENT_ACCESS | wxFSW_EVENT_WARNING | wxFSW_EVENT_ERROR;
-    if ((event.GetChangeType() & kNoChange) == 0 && !gather_.IsRunning()) gather_.StartOnce(kGatherMs);
+    if ((event.GetChangeType() & kNoChange) == 0 && !gather_.IsRunning())
+      gather_.StartOnce(kGatherMs);
   });
 }
 

@@ -13,8 +13,8 @@ namespace fotomill::desktop {
 class FolderWatch : public wxEvtHandler {
  public:
   explicit FolderWatch(std::function<void()> changed);
-  // Watches a folder from here on, unless WatchFolders is off; an empty name watches nothing. Only works once the program waits
-  // for events.
+  // Watches a folder from here on, unless WatchFolders is off; an empty name watches nothing. Only
+  // works once the program waits for events.
   void Watch(const std::string& folder);
 
  private:

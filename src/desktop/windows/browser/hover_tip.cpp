@@ -22,7 +22,8 @@ HoverTip::HoverTip(wxWindow& window) : window_(window), wait_(this) {
 }
 
 void HoverTip::Over(const std::string& folder, const FolderItem* item, Status known) {
-  const std::string name = item == nullptr || settings.FileTipShow == 0 ? std::string() : item->name;
+  const std::string name =
+      item == nullptr || settings.FileTipShow == 0 ? std::string() : item->name;
   if (name == item_.name && folder == folder_) return;
   wait_.Stop();
   reading_.Stop();
@@ -30,11 +31,13 @@ void HoverTip::Over(const std::string& folder, const FolderItem* item, Status kn
   folder_ = folder;
   item_ = name.empty() ? FolderItem() : *item;
   known_ = known;
-  if (!name.empty()) wait_.StartOnce(std::clamp(settings.FileTipDelay - kSystemsDelayMs, 1, 60'000));
+  if (!name.empty())
+    wait_.StartOnce(std::clamp(settings.FileTipDelay - kSystemsDelayMs, 1, 60'000));
 }
 
 void HoverTip::Read() {
-  reading_.Start([this, folder = folder_, item = item_, known = known_](const StopToken&, const LooseWork::Report& report) {
+  reading_.Start([this, folder = folder_, item = item_, known = known_](
+                     const StopToken&, const LooseWork::Report& report) {
     report([this, lines = FileTipLines(folder, item, known)] {
       wxString text;
       for (const std::string& line : lines) text += (text.empty() ? "" : "\n") + Shown(line);

@@ -24,21 +24,23 @@ namespace {
 
 // What is typed may begin with "~" for the home folder.
 std::string FolderTyped(std::string typed) {
-  if (typed.starts_with('~')) typed.replace(0, 1, platform::SpecialFolderPath(platform::SpecialFolder::Home));
+  if (typed.starts_with('~'))
+    typed.replace(0, 1, platform::SpecialFolderPath(platform::SpecialFolder::Home));
   return platform::AbsolutePath(typed);
 }
 
 }  // namespace
 
 PathBar::PathBar(wxWindow* parent, const FolderTrail& trail, Events events)
-    : wxPanel(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTAB_TRAVERSAL | wxBORDER_NONE, "Path"),
+    : wxPanel(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTAB_TRAVERSAL | wxBORDER_NONE,
+              "Path"),
       trail_(trail),
       events_(std::move(events)) {
   auto* row = new wxBoxSizer(wxHORIZONTAL);
   const int gap = FromDIP(4);
   const auto button = [&](const char* symbol, const wxString& tip, auto run) {
-    auto* made = new wxBitmapButton(this, wxID_ANY, Symbol(symbol), wxDefaultPosition, wxDefaultSize, wxBORDER_NONE,
-                                    wxDefaultValidator, tip);
+    auto* made = new wxBitmapButton(this, wxID_ANY, Symbol(symbol), wxDefaultPosition,
+                                    wxDefaultSize, wxBORDER_NONE, wxDefaultValidator, tip);
     made->SetToolTip(tip);
     made->Bind(wxEVT_BUTTON, [run](wxCommandEvent&) { run(); });
     made->Bind(wxEVT_SYS_COLOUR_CHANGED, [made, symbol](wxSysColourChangedEvent& event) {
@@ -61,7 +63,8 @@ PathBar::PathBar(wxWindow* parent, const FolderTrail& trail, Events events)
 }
 
 void PathBar::BuildEdit() {
-  edit_ = new wxTextCtrl(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxTE_PROCESS_ENTER, wxDefaultValidator, Label("Folder"));
+  edit_ = new wxTextCtrl(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxTE_PROCESS_ENTER,
+                         wxDefaultValidator, Label("Folder"));
   edit_->Bind(wxEVT_TEXT, [this](wxCommandEvent&) { ReadNames(); });
   edit_->Hide();
   edit_->Bind(wxEVT_TEXT_ENTER, [this](wxCommandEvent&) { OpenTyped(); });
@@ -83,7 +86,8 @@ void PathBar::BuildEdit() {
 void PathBar::ShowFolder(const std::string& folder) {
   folder_ = folder;
   // A button that goes gray would take the keyboard with it.
-  if ((back_->HasFocus() && !trail_.CanStep(-1)) || (forward_->HasFocus() && !trail_.CanStep(1))) events_.left();
+  if ((back_->HasFocus() && !trail_.CanStep(-1)) || (forward_->HasFocus() && !trail_.CanStep(1)))
+    events_.left();
   back_->Enable(trail_.CanStep(-1));
   forward_->Enable(trail_.CanStep(1));
   crumbs_->ShowFolder(folder);
@@ -100,7 +104,8 @@ void PathBar::Edit() {
   ReadNames();
 }
 
-// The folders beside what is typed are read apart, since a folder may hang, and complete it once they are there.
+// The folders beside what is typed are read apart, since a folder may hang, and complete it once
+// they are there.
 void PathBar::ReadNames() {
   const std::string above(platform::SplitPath(Utf8(edit_->GetValue())).folder);
   if (above.empty() || above == namesOf_) return CallAfter([this] { CompleteTyped(); });
@@ -126,19 +131,22 @@ wxString PathBar::Typed() const {
 // Completes what has become longer by typing at its end.
 void PathBar::CompleteTyped() {
   const wxString typed = Typed();
-  const bool longer = typed.length() > typedLength_ && edit_->GetInsertionPoint() == edit_->GetLastPosition();
+  const bool longer =
+      typed.length() > typedLength_ && edit_->GetInsertionPoint() == edit_->GetLastPosition();
   typedLength_ = typed.length();
   if (longer && typed == edit_->GetValue()) ShowCompletion(0);
 }
 
-// Puts a way how the path may go on behind what was typed, marked, so that typing on replaces it. `step` goes on to the next.
+// Puts a way how the path may go on behind what was typed, marked, so that typing on replaces it.
+// `step` goes on to the next.
 void PathBar::ShowCompletion(int step) {
   const wxString typed = Typed();
   const std::vector<std::string> paths = Completions(Utf8(typed), names_);
   if (paths.empty()) return;
   const int count = static_cast<int>(paths.size());
   const auto shown = std::ranges::find(paths, Utf8(edit_->GetValue()));
-  const int place = shown == paths.end() ? 0 : (static_cast<int>(shown - paths.begin()) + step + count) % count;
+  const int place =
+      shown == paths.end() ? 0 : (static_cast<int>(shown - paths.begin()) + step + count) % count;
   edit_->ChangeValue(wxString::FromUTF8(paths[static_cast<size_t>(place)]));
   edit_->SetSelection(static_cast<long>(typed.length()), -1);
 }
@@ -173,7 +181,8 @@ void PathBar::OfferTrail() {
   int last = 0;
   while (trail_.CanStep(last + 1)) ++last;
   std::vector<Crumb> folders;
-  for (int steps = last; trail_.CanStep(steps); --steps) folders.push_back({trail_.FolderAt(steps), trail_.FolderAt(steps)});
+  for (int steps = last; trail_.CanStep(steps); --steps)
+    folders.push_back({trail_.FolderAt(steps), trail_.FolderAt(steps)});
   const auto chosen = ChooseFolderFromMenu(*back_, folders, folder_);
   if (chosen && last != static_cast<int>(*chosen)) events_.step(last - static_cast<int>(*chosen));
 }

@@ -17,7 +17,8 @@ namespace fotomill::desktop {
 class CrumbStrip;
 class FolderTrail;
 
-// Where a browser is, and the ways from there: back, forward, up, a folder on the way or below it, or one that is typed.
+// Where a browser is, and the ways from there: back, forward, up, a folder on the way or below it,
+// or one that is typed.
 class PathBar : public wxPanel {
  public:
   // What the user did in it.
@@ -56,7 +57,8 @@ class PathBar : public wxPanel {
   wxTextCtrl* edit_ = nullptr;
   std::string namesOf_;             // the folder that is typed so far
   std::vector<std::string> names_;  // of the folders in it
-  size_t typedLength_ = 0;          // of the field's text when it was last looked at, without what completes it
+  // of the field's text when it was last looked at, without what completes it
+  size_t typedLength_ = 0;
   LooseWork reading_;
 };
 

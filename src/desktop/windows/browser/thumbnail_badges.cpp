@@ -6,13 +6,14 @@ namespace {
 
 constexpr int kSquare = 4;  // of the checkerboard, device-independent pixels
 
-void DrawPages(wxDC& dc, const wxWindow& window, const wxRect& picture, const Thumbnail& thumbnail, const wxColour& color,
-               const wxColour& textColor) {
+void DrawPages(wxDC& dc, const wxWindow& window, const wxRect& picture, const Thumbnail& thumbnail,
+               const wxColour& color, const wxColour& textColor) {
   const wxString pages = wxString::Format("%d", thumbnail.pages);
   const wxSize text = dc.GetTextExtent(pages);
   const int gap = window.FromDIP(4), side = thumbnail.animated ? text.y / 2 : 0;
   const wxSize size(text.x + 2 * gap + (side == 0 ? 0 : side + gap), text.y + window.FromDIP(2));
-  const wxRect badge(wxPoint(picture.GetRight() + 1 - size.x, picture.GetBottom() + 1 - size.y), size);
+  const wxRect badge(wxPoint(picture.GetRight() + 1 - size.x, picture.GetBottom() + 1 - size.y),
+                     size);
   dc.SetPen(*wxTRANSPARENT_PEN);
   dc.SetBrush(wxBrush(color));
   dc.DrawRoundedRectangle(badge, window.FromDIP(3));
@@ -40,8 +41,8 @@ void DrawCheckerboard(wxDC& dc, const wxWindow& window, const wxRect& picture) {
 
 }  // namespace
 
-void DrawBadges(wxDC& dc, const wxWindow& window, const wxRect& picture, const Thumbnail& thumbnail, const wxColour& color,
-                const wxColour& textColor) {
+void DrawBadges(wxDC& dc, const wxWindow& window, const wxRect& picture, const Thumbnail& thumbnail,
+                const wxColour& color, const wxColour& textColor) {
   if (thumbnail.alpha) DrawCheckerboard(dc, window, picture);
   if (thumbnail.pages > 1) DrawPages(dc, window, picture, thumbnail, color, textColor);
 }

@@ -32,10 +32,16 @@ bool OpensMenu(const wxKeyEvent& event) {
 
 }  // namespace
 
-ThumbnailCanvas::ThumbnailCanvas(wxWindow* parent, BrowserModel& model, ThumbnailService& thumbnails, Events events)
-    : model_(model), thumbnails_(thumbnails), events_(std::move(events)), bandTimer_(this), tip_(*this) {
+ThumbnailCanvas::ThumbnailCanvas(wxWindow* parent, BrowserModel& model,
+                                 ThumbnailService& thumbnails, Events events)
+    : model_(model),
+      thumbnails_(thumbnails),
+      events_(std::move(events)),
+      bandTimer_(this),
+      tip_(*this) {
   SetBackgroundStyle(wxBG_STYLE_PAINT);
-  Create(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxVSCROLL | wxWANTS_CHARS | wxBORDER_NONE, Label("Thumbnails"));
+  Create(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize,
+         wxVSCROLL | wxWANTS_CHARS | wxBORDER_NONE, Label("Thumbnails"));
   SetLabel("Files of the folder");
   Bind(wxEVT_PAINT, &ThumbnailCanvas::OnPaint, this);
   Bind(wxEVT_SIZE, &ThumbnailCanvas::OnSize, this);
@@ -59,7 +65,8 @@ ThumbnailCanvas::ThumbnailCanvas(wxWindow* parent, BrowserModel& model, Thumbnai
   });
   Bind(wxEVT_SET_FOCUS, [this](wxFocusEvent& event) { Refresh(), event.Skip(); });
   Bind(wxEVT_KILL_FOCUS, [this](wxFocusEvent& event) { Refresh(), event.Skip(); });
-  Bind(wxEVT_SYS_COLOUR_CHANGED, [this](wxSysColourChangedEvent& event) { Refresh(), event.Skip(); });
+  Bind(wxEVT_SYS_COLOUR_CHANGED,
+       [this](wxSysColourChangedEvent& event) { Refresh(), event.Skip(); });
   Bind(wxEVT_DPI_CHANGED, [this](wxDPIChangedEvent& event) { ModelChanged(), event.Skip(); });
   // While the rubber band is held beyond the edge the list continues scrolling.
   Bind(wxEVT_TIMER, [this](wxTimerEvent&) {
@@ -80,7 +87,9 @@ void ThumbnailCanvas::MeasureCells() {
     square_ = 0;
     layout_.SetCells(TextWidth(*this, kListWidth), textHeight_ + padding, FromDIP(2));
   } else {
-    square_ = FromDIP(model_.Modes().view == choice::kViewSmall ? 48 : model_.Modes().view == choice::kViewLarge ? 176 : 96);
+    square_ = FromDIP(model_.Modes().view == choice::kViewSmall   ? 48
+                      : model_.Modes().view == choice::kViewLarge ? 176
+                                                                  : 96);
     const int width = std::max(square_ + 4 * padding, TextWidth(*this, 96));
     layout_.SetCells(width, square_ + textHeight_ + 3 * padding, FromDIP(4));
   }
@@ -99,7 +108,8 @@ void ThumbnailCanvas::ModelChanged() {
 }
 
 void ThumbnailCanvas::UpdateScrollbar() {
-  SetScrollbar(wxVERTICAL, static_cast<int>(scroll_), GetClientSize().y, static_cast<int>(layout_.TotalHeight()));
+  SetScrollbar(wxVERTICAL, static_cast<int>(scroll_), GetClientSize().y,
+               static_cast<int>(layout_.TotalHeight()));
 }
 
 ThumbnailRequest ThumbnailCanvas::RequestOf(size_t line) const {
@@ -114,8 +124,9 @@ ThumbnailRequest ThumbnailCanvas::RequestOf(size_t line) const {
   return request;
 }
 
-// Stand-ins for what is visible first, then the thumbnails themselves, then a screen ahead in the direction of scrolling, then
-// the rest from there on, if it is to be made before anybody looks at it.
+// Stand-ins for what is visible first, then the thumbnails themselves, then a screen ahead in the
+// direction of scrolling, then the rest from there on, if it is to be made before anybody looks at
+// it.
 void ThumbnailCanvas::WantThumbnails() {
   std::vector<ThumbnailRequest> requests;
   const auto want = [&](size_t first, size_t end) {
@@ -131,12 +142,15 @@ void ThumbnailCanvas::WantThumbnails() {
     const CellLayout::Range visible = layout_.Visible(scroll_);
     want(visible.first, visible.end);
     const std::vector<ThumbnailRequest> standIns = StandInsFor(visible);
-    const int64_t ahead = direction_ > 0 ? scroll_ + height : std::max<int64_t>(scroll_ - height, 0);
+    const int64_t ahead =
+        direction_ > 0 ? scroll_ + height : std::max<int64_t>(scroll_ - height, 0);
     const CellLayout::Range next = layout_.LinesBetween(ahead, ahead + height);
     if (direction_ > 0) want(std::max(next.first, visible.end), next.end);
     if (direction_ < 0) want(next.first, std::min(next.end, visible.first));
     if (settings.BrowserThumbnailPrecacheEnable != 0) {
-      for (size_t line = visible.end; line < model_.LineCount() && requests.size() < kPrecache; ++line) want(line, line + 1);
+      for (size_t line = visible.end; line < model_.LineCount() && requests.size() < kPrecache;
+           ++line)
+        want(line, line + 1);
     }
     requests.insert(requests.begin(), standIns.begin(), standIns.end());
   }
@@ -161,9 +175,12 @@ void ThumbnailCanvas::ThumbnailsCame(const std::vector<ThumbnailLoader::Result>&
   size_t empty = 0;
   for (size_t line = range.first; line < range.end; ++line) {
     visible.insert(model_.PathOfLine(line));
-    if (!model_.Line(line).folder && thumbnails_.FindAny(model_.PathOfLine(line)) == nullptr) ++empty;
+    if (!model_.Line(line).folder && thumbnails_.FindAny(model_.PathOfLine(line)) == nullptr)
+      ++empty;
   }
-  const auto shows = [&](const ThumbnailLoader::Result& result) { return visible.contains(result.request.path); };
+  const auto shows = [&](const ThumbnailLoader::Result& result) {
+    return visible.contains(result.request.path);
+  };
   if (std::any_of(results.begin(), results.end(), shows)) Refresh();
   if (empty == 0 && filled_ != model_.Folder()) LogEvent("filled", std::to_string(visible.size()));
   if (empty == 0) filled_ = model_.Folder();
@@ -219,19 +236,23 @@ void ThumbnailCanvas::OnScroll(wxScrollWinEvent& event) {
 }
 
 void ThumbnailCanvas::OnWheel(wxMouseEvent& event) {
-  if (event.GetWheelAxis() != wxMOUSE_WHEEL_VERTICAL || event.GetWheelDelta() == 0) return event.Skip();
+  if (event.GetWheelAxis() != wxMOUSE_WHEEL_VERTICAL || event.GetWheelDelta() == 0)
+    return event.Skip();
   const double notches = static_cast<double>(event.GetWheelRotation()) / event.GetWheelDelta();
   if (event.ControlDown()) {
     if (events_.resize && notches != 0) events_.resize(notches > 0 ? 1 : -1);
     return;
   }
-  const double step = ListsNames() ? 3.0 * layout_.RowHeight() : std::max(layout_.RowHeight() / 2.0, FromDIP(60) * 1.0);
+  const double step = ListsNames() ? 3.0 * layout_.RowHeight()
+                                   : std::max(layout_.RowHeight() / 2.0, FromDIP(60) * 1.0);
   ScrollTo(scroll_ - std::lround(notches * step));
 }
 
 // --- mouse ---
 
-size_t ThumbnailCanvas::LineAt(const wxPoint& point) const { return layout_.LineAt(point.x, point.y + scroll_); }
+size_t ThumbnailCanvas::LineAt(const wxPoint& point) const {
+  return layout_.LineAt(point.x, point.y + scroll_);
+}
 
 // Screen readers know the canvas by the file with the focus, and say it again when that changes.
 void ThumbnailCanvas::ReportFocus() {
@@ -259,7 +280,8 @@ void ThumbnailCanvas::OnMouseDown(wxMouseEvent& event) {
     if (!keep) selection.ClickBlank(settings.ClearAllOnBlankClick != 0);
     return ReportSelection();
   }
-  // A press on a selected line may begin a drag of all; what a plain click does is done when the button goes up.
+  // A press on a selected line may begin a drag of all; what a plain click does is done when the
+  // button goes up.
   if (selection.IsSelected(line) && !event.ControlDown() && !event.ShiftDown()) return;
   selection.Click(line, event.ShiftDown(), event.ControlDown());
   ReportSelection();
@@ -268,7 +290,8 @@ void ThumbnailCanvas::OnMouseDown(wxMouseEvent& event) {
 void ThumbnailCanvas::OnMouseUp(wxMouseEvent& event) {
   if (HasCapture()) ReleaseMouse();
   bandTimer_.Stop();
-  const bool click = pressed_ && !banding_ && pressedLine_ != kNoLine && !event.ControlDown() && !event.ShiftDown();
+  const bool click = pressed_ && !banding_ && pressedLine_ != kNoLine && !event.ControlDown() &&
+                     !event.ShiftDown();
   if (click && LineAt(event.GetPosition()) == pressedLine_) {
     model_.Selected().Click(pressedLine_, false, false);
     ReportSelection();
@@ -296,7 +319,8 @@ void ThumbnailCanvas::OnMouseMove(wxMouseEvent& event) {
     bandTimer_.Start(40);
   }
   bandEnd_ = now;
-  const Rect band{std::min(pressed_->x, now.x), std::min(pressed_->y, now.y), std::abs(way.x) + 1, std::abs(way.y) + 1};
+  const Rect band{std::min(pressed_->x, now.x), std::min(pressed_->y, now.y), std::abs(way.x) + 1,
+                  std::abs(way.y) + 1};
   selection.MoveBand(layout_.LinesIn(band));
   ReportSelection();
 }
@@ -319,7 +343,8 @@ void ThumbnailCanvas::OnRightDown(wxMouseEvent& event) {
 void ThumbnailCanvas::UpdateTip(size_t line) {
   if (line >= model_.LineCount()) return tip_.Over(model_.Folder(), nullptr, Status::Ok);
   const ThumbnailPointer thumbnail = thumbnails_.FindAny(model_.PathOfLine(line));
-  tip_.Over(model_.Folder(), &model_.Line(line), thumbnail == nullptr ? Status::Ok : thumbnail->status);
+  tip_.Over(model_.Folder(), &model_.Line(line),
+            thumbnail == nullptr ? Status::Ok : thumbnail->status);
 }
 
 // --- keyboard ---
@@ -343,7 +368,8 @@ void ThumbnailCanvas::OnKey(wxKeyEvent& event) {
   };
   if (event.AltDown()) return event.Skip();
   if (event.GetKeyCode() == WXK_TAB && !event.ControlDown()) {
-    Navigate(event.ShiftDown() ? wxNavigationKeyEvent::IsBackward : wxNavigationKeyEvent::IsForward);
+    Navigate(event.ShiftDown() ? wxNavigationKeyEvent::IsBackward
+                               : wxNavigationKeyEvent::IsForward);
     return;
   }
   for (const KeyStep& row : kSteps) {
@@ -352,7 +378,9 @@ void ThumbnailCanvas::OnKey(wxKeyEvent& event) {
   const size_t focus = model_.Selected().Focus();
   if (OpensMenu(event) && focus != kNoLine && events_.contextMenu) {
     const Rect cell = layout_.Cell(focus);
-    return events_.contextMenu(focus, wxPoint(cell.x + cell.width / 2, static_cast<int>(cell.y - scroll_) + cell.height / 2));
+    return events_.contextMenu(
+        focus,
+        wxPoint(cell.x + cell.width / 2, static_cast<int>(cell.y - scroll_) + cell.height / 2));
   }
   const bool enter = event.GetKeyCode() == WXK_RETURN || event.GetKeyCode() == WXK_NUMPAD_ENTER;
   if (enter && !event.HasAnyModifiers() && focus != kNoLine) return events_.activated(focus);
@@ -391,9 +419,11 @@ void ThumbnailCanvas::EditName(size_t line) {
   const int height = textHeight_ + FromDIP(12);
   const int top = static_cast<int>(cell.y - scroll_) + cell.height - height;
   editedLine_ = line;
-  editor_ = new wxTextCtrl(this, wxID_ANY, Shown(name), wxPoint(cell.x, top), wxSize(std::max(cell.width, FromDIP(160)), height),
-                           wxTE_PROCESS_ENTER, wxDefaultValidator, Label("New name"));
-  editor_->Bind(wxEVT_TEXT_ENTER, [this](wxCommandEvent&) { CallAfter([this] { FinishEdit(true); }); });
+  editor_ = new wxTextCtrl(this, wxID_ANY, Shown(name), wxPoint(cell.x, top),
+                           wxSize(std::max(cell.width, FromDIP(160)), height), wxTE_PROCESS_ENTER,
+                           wxDefaultValidator, Label("New name"));
+  editor_->Bind(wxEVT_TEXT_ENTER,
+                [this](wxCommandEvent&) { CallAfter([this] { FinishEdit(true); }); });
   editor_->Bind(wxEVT_KILL_FOCUS, [this](wxFocusEvent& event) {
     CallAfter([this] { FinishEdit(true); });
     event.Skip();
@@ -403,8 +433,11 @@ void ThumbnailCanvas::EditName(size_t line) {
     CallAfter([this] { FinishEdit(false); });
   });
   editor_->SetFocus();
-  const size_t base = model_.Line(line).folder ? name.size() : name.size() - platform::SplitPath(name).extension.size();
-  editor_->SetSelection(0, static_cast<long>(Shown(std::string_view(name).substr(0, base)).length()));
+  const size_t base = model_.Line(line).folder
+                          ? name.size()
+                          : name.size() - platform::SplitPath(name).extension.size();
+  editor_->SetSelection(0,
+                        static_cast<long>(Shown(std::string_view(name).substr(0, base)).length()));
 }
 
 void ThumbnailCanvas::FinishEdit(bool accept) {
@@ -413,7 +446,8 @@ void ThumbnailCanvas::FinishEdit(bool accept) {
   const size_t line = std::exchange(editedLine_, kNoLine);
   const std::string name = Utf8(editor->GetValue());
   const bool hadFocus = editor->HasFocus();
-  const bool changed = line < model_.LineCount() && editor->IsModified() && name != model_.Line(line).name;
+  const bool changed =
+      line < model_.LineCount() && editor->IsModified() && name != model_.Line(line).name;
   editor->Hide();
   editor->Destroy();
   if (hadFocus) SetFocus();

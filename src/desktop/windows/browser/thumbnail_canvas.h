@@ -18,25 +18,29 @@ class wxTextCtrl;
 
 namespace fotomill::desktop {
 
-// The thumbnail list of a browser: one window that draws the cells that are visible, whatever the number of files.
+// The thumbnail list of a browser: one window that draws the cells that are visible, whatever the
+// number of files.
 class ThumbnailCanvas : public wxWindow {
  public:
   // What it tells the browser.
   struct Events {
     std::function<void()> selectionChanged;
     std::function<void(size_t line)> activated;                    // double click
-    std::function<void(size_t line, const wxPoint&)> contextMenu;  // kNoLine: on empty space; where in the canvas
+    // kNoLine: on empty space; where in the canvas
+    std::function<void(size_t line, const wxPoint&)> contextMenu;
     std::function<void()> dragBegins;
     std::function<void(int steps)> resize;  // Ctrl and the wheel
     std::function<void(size_t line, const std::string& name)> renamed;
   };
 
-  ThumbnailCanvas(wxWindow* parent, BrowserModel& model, ThumbnailService& thumbnails, Events events);
+  ThumbnailCanvas(wxWindow* parent, BrowserModel& model, ThumbnailService& thumbnails,
+                  Events events);
 
   // The model has other lines, or another view mode.
   void ModelChanged();
   void ThumbnailsCame(const std::vector<ThumbnailLoader::Result>& results);
-  // Asks for what is visible, then for what is near. To be called when this browser comes to the front.
+  // Asks for what is visible, then for what is near. To be called when this browser comes to the
+  // front.
   void WantThumbnails();
   void ShowLine(size_t line);
   int64_t Scroll() const { return scroll_; }
@@ -66,7 +70,8 @@ class ThumbnailCanvas : public wxWindow {
   void MeasureCells();
   void DrawCell(wxDC& dc, size_t line, const Looks& looks);
   void DrawPicture(wxDC& dc, size_t line, const wxRect& square, const Looks& looks);
-  void DrawPlaceholder(wxDC& dc, const FolderItem& item, const wxRect& square, const wxString& mark, const Looks& looks);
+  void DrawPlaceholder(wxDC& dc, const FolderItem& item, const wxRect& square, const wxString& mark,
+                       const Looks& looks);
   wxString CutName(wxDC& dc, const std::string& name, int width);
   const wxBitmap& BitmapOfThumbnail(const ThumbnailPointer& thumbnail);
   ThumbnailRequest RequestOf(size_t line) const;

@@ -34,14 +34,16 @@ struct ThumbnailCanvas::Looks {
   wxColour note = ToWx(palette.note), fault = ToWx(palette.fault);
 };
 
-// Painting tells the log when the first one, and the first one with files, was done, and which ones were slow.
+// Painting tells the log when the first one, and the first one with files, was done, and which ones
+// were slow.
 void ThumbnailCanvas::OnPaint(wxPaintEvent&) {
   constexpr double kFrame = 1.0 / 60;
   const double start = platform::MonotonicSeconds();
   Paint();
   const double seconds = platform::MonotonicSeconds() - start;
   const int stage = model_.LineCount() > 0 ? 2 : 1;
-  if (stage > painted_) LogEvent(stage == 2 ? "painted-files" : "painted", std::to_string(model_.LineCount()));
+  if (stage > painted_)
+    LogEvent(stage == 2 ? "painted-files" : "painted", std::to_string(model_.LineCount()));
   painted_ = std::max(painted_, stage);
   if (seconds > kFrame) LogEvent("slow-paint", std::to_string(std::lround(seconds * 1000)) + " ms");
 }
@@ -54,16 +56,20 @@ void ThumbnailCanvas::Paint() {
   dc.SetFont(GetFont());
   if (model_.LineCount() == 0 && !model_.Folder().empty()) {
     dc.SetTextForeground(looks.note);
-    dc.DrawLabel(model_.Filter().empty() ? Label("There are no pictures in this folder.") : Label("No name matches the filter."),
+    dc.DrawLabel(model_.Filter().empty() ? Label("There are no pictures in this folder.")
+                                         : Label("No name matches the filter."),
                  wxRect(GetClientSize()), wxALIGN_CENTER);
   }
   const CellLayout::Range visible = layout_.Visible(scroll_);
   for (size_t line = visible.first; line < visible.end; ++line) DrawCell(dc, line, looks);
   if (banding_ && pressed_) {
-    const wxRect band(wxPoint(std::min(pressed_->x, bandEnd_.x), static_cast<int>(std::min(pressed_->y, bandEnd_.y) - scroll_)),
-                      wxSize(std::abs(pressed_->x - bandEnd_.x) + 1, std::abs(pressed_->y - bandEnd_.y) + 1));
+    const wxRect band(
+        wxPoint(std::min(pressed_->x, bandEnd_.x),
+                static_cast<int>(std::min(pressed_->y, bandEnd_.y) - scroll_)),
+        wxSize(std::abs(pressed_->x - bandEnd_.x) + 1, std::abs(pressed_->y - bandEnd_.y) + 1));
     dc.SetPen(wxPen(looks.selected));
-    dc.SetBrush(wxBrush(wxColour(looks.selected.Red(), looks.selected.Green(), looks.selected.Blue(), 48)));
+    dc.SetBrush(
+        wxBrush(wxColour(looks.selected.Red(), looks.selected.Green(), looks.selected.Blue(), 48)));
     dc.DrawRectangle(band);
   }
 }
@@ -73,7 +79,9 @@ void ThumbnailCanvas::DrawCell(wxDC& dc, size_t line, const Looks& looks) {
   const wxRect cell(place.x, static_cast<int>(place.y - scroll_), place.width, place.height);
   const bool selected = model_.Selected().IsSelected(line);
   const bool focused = model_.Selected().Focus() == line && HasFocus();
-  const wxColour text = !selected ? looks.text : HasFocus() ? looks.selectedText : looks.restingText;
+  const wxColour text = !selected    ? looks.text
+                        : HasFocus() ? looks.selectedText
+                                     : looks.restingText;
   if (selected) {
     dc.SetPen(*wxTRANSPARENT_PEN);
     dc.SetBrush(wxBrush(HasFocus() ? looks.selected : looks.resting));
@@ -88,11 +96,13 @@ void ThumbnailCanvas::DrawCell(wxDC& dc, size_t line, const Looks& looks) {
   const int padding = FromDIP(kPadding);
   dc.SetTextForeground(text);
   if (square_ == 0) {
-    const wxRect icon(cell.x + padding, cell.y + (cell.height - FromDIP(16)) / 2, FromDIP(16), FromDIP(16));
+    const wxRect icon(cell.x + padding, cell.y + (cell.height - FromDIP(16)) / 2, FromDIP(16),
+                      FromDIP(16));
     DrawPlaceholder(dc, item, icon, {}, looks);
     const int left = icon.GetRight() + padding;
     dc.SetTextForeground(text);
-    dc.DrawText(CutName(dc, item.name, cell.GetRight() - left - padding), left, cell.y + (cell.height - textHeight_) / 2);
+    dc.DrawText(CutName(dc, item.name, cell.GetRight() - left - padding), left,
+                cell.y + (cell.height - textHeight_) / 2);
     return;
   }
   const wxRect square(cell.x + (cell.width - square_) / 2, cell.y + padding, square_, square_);
@@ -100,7 +110,8 @@ void ThumbnailCanvas::DrawCell(wxDC& dc, size_t line, const Looks& looks) {
   if (line == editedLine_) return;
   const wxString name = CutName(dc, item.name, cell.width - 2 * FromDIP(3));
   dc.SetTextForeground(text);
-  dc.DrawText(name, cell.x + (cell.width - dc.GetTextExtent(name).x) / 2, square.GetBottom() + 1 + padding);
+  dc.DrawText(name, cell.x + (cell.width - dc.GetTextExtent(name).x) / 2,
+              square.GetBottom() + 1 + padding);
 }
 
 void ThumbnailCanvas::DrawPicture(wxDC& dc, size_t line, const wxRect& square, const Looks& looks) {
@@ -111,18 +122,21 @@ void ThumbnailCanvas::DrawPicture(wxDC& dc, size_t line, const wxRect& square, c
   const bool right = thumbnail != nullptr;
   if (!right) thumbnail = thumbnails_.FindAny(request.path);
   if (thumbnail == nullptr || thumbnail->status != Status::Ok) {
-    return DrawPlaceholder(dc, item, square, thumbnail == nullptr ? wxString() : wxString("!"), looks);
+    return DrawPlaceholder(dc, item, square, thumbnail == nullptr ? wxString() : wxString("!"),
+                           looks);
   }
   const wxBitmap& bitmap = BitmapOfThumbnail(thumbnail);
   if (!bitmap.IsOk()) return DrawPlaceholder(dc, item, square, "!", looks);
   // One of another size, or the file's own, stands in until the right one comes.
   double scale = 1;
-  const wxSize size =
-      wxSize(static_cast<int>(std::lround(bitmap.GetLogicalWidth())), static_cast<int>(std::lround(bitmap.GetLogicalHeight())));
+  const wxSize size = wxSize(static_cast<int>(std::lround(bitmap.GetLogicalWidth())),
+                             static_cast<int>(std::lround(bitmap.GetLogicalHeight())));
   if (!right) scale = static_cast<double>(square_) / std::max({size.x, size.y, 1});
   if (!right && !thumbnail->standIn) scale = std::min(scale, 1.0);
-  const wxSize shown(std::max(static_cast<int>(size.x * scale), 1), std::max(static_cast<int>(size.y * scale), 1));
-  const wxPoint corner(square.x + (square.width - shown.x) / 2, square.y + (square.height - shown.y) / 2);
+  const wxSize shown(std::max(static_cast<int>(size.x * scale), 1),
+                     std::max(static_cast<int>(size.y * scale), 1));
+  const wxPoint corner(square.x + (square.width - shown.x) / 2,
+                       square.y + (square.height - shown.y) / 2);
   if (scale == 1) {
     dc.DrawBitmap(bitmap, corner);
   } else {
@@ -137,21 +151,24 @@ void ThumbnailCanvas::DrawPicture(wxDC& dc, size_t line, const wxRect& square, c
 }
 
 // A folder, or a sheet with the file's extension: what there is before, or instead of, a thumbnail.
-void ThumbnailCanvas::DrawPlaceholder(wxDC& dc, const FolderItem& item, const wxRect& square, const wxString& mark,
-                                      const Looks& looks) {
+void ThumbnailCanvas::DrawPlaceholder(wxDC& dc, const FolderItem& item, const wxRect& square,
+                                      const wxString& mark, const Looks& looks) {
   if (item.folder) {
     const int side = square.width;
-    const wxRect body(square.x + side / 10, square.y + side * 3 / 10, side * 8 / 10, side * 11 / 20);
+    const wxRect body(square.x + side / 10, square.y + side * 3 / 10, side * 8 / 10,
+                      side * 11 / 20);
     const wxColour paper(0xe8, 0xb9, 0x4a), tab(0xc9, 0x95, 0x2b);
     dc.SetPen(*wxTRANSPARENT_PEN);
     dc.SetBrush(wxBrush(tab));
-    dc.DrawRoundedRectangle(body.x, body.y - side / 10, body.width * 9 / 20, side / 4, std::max(side / 24.0, 1.0));
+    dc.DrawRoundedRectangle(body.x, body.y - side / 10, body.width * 9 / 20, side / 4,
+                            std::max(side / 24.0, 1.0));
     dc.SetBrush(wxBrush(paper));
     dc.DrawRoundedRectangle(body, std::max(side / 24.0, 1.0));
     return;
   }
   const int height = square.height * 3 / 4, width = height * 3 / 4;
-  const wxRect sheet(square.x + (square.width - width) / 2, square.y + (square.height - height) / 2, width, height);
+  const wxRect sheet(square.x + (square.width - width) / 2, square.y + (square.height - height) / 2,
+                     width, height);
   dc.SetPen(wxPen(looks.frame));
   dc.SetBrush(wxBrush(looks.faint));
   dc.DrawRoundedRectangle(sheet, std::max(square.width / 32.0, 1.0));
@@ -172,7 +189,9 @@ wxString ThumbnailCanvas::CutName(wxDC& dc, const std::string& name, int width) 
   if (width != cutWidth_ || cutNames_.size() > kMostCutNames) cutNames_.clear();
   cutWidth_ = width;
   const auto [found, added] = cutNames_.try_emplace(name);
-  if (added) found->second = wxControl::Ellipsize(Shown(name), dc, wxELLIPSIZE_MIDDLE, width, wxELLIPSIZE_FLAGS_NONE);
+  if (added)
+    found->second =
+        wxControl::Ellipsize(Shown(name), dc, wxELLIPSIZE_MIDDLE, width, wxELLIPSIZE_FLAGS_NONE);
   return found->second;
 }
 
@@ -181,7 +200,9 @@ const wxBitmap& ThumbnailCanvas::BitmapOfThumbnail(const ThumbnailPointer& thumb
   if (found != bitmaps_.end()) return found->second.bitmap;
   const double side = square_ * GetContentScaleFactor();
   if (static_cast<double>(bitmaps_.size()) * side * side * 7 > kBitmapBytes) bitmaps_.clear();
-  return bitmaps_.try_emplace(thumbnail.get(), Drawn{thumbnail, BitmapOf(thumbnail->pixels, GetContentScaleFactor())})
+  return bitmaps_
+      .try_emplace(thumbnail.get(),
+                   Drawn{thumbnail, BitmapOf(thumbnail->pixels, GetContentScaleFactor())})
       .first->second.bitmap;
 }
 

@@ -9,8 +9,9 @@ constexpr uint64_t kCacheBytes = 256ull * 1024 * 1024;
 }  // namespace
 
 ThumbnailService::ThumbnailService()
-    : cache_(kCacheBytes),
-      loader_(std::make_unique<ThumbnailLoader>(ThumbnailsAtOnce(), [this] { CallAfter([this] { FetchResults(); }); })) {}
+    : cache_(kCacheBytes), loader_(std::make_unique<ThumbnailLoader>(ThumbnailsAtOnce(), [this] {
+        CallAfter([this] { FetchResults(); });
+      })) {}
 
 ThumbnailService::~ThumbnailService() {
   loader_.reset();  // before its events' handler goes

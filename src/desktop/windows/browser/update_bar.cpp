@@ -14,7 +14,8 @@
 namespace fotomill::desktop {
 
 UpdateBar::UpdateBar(wxWindow* parent, std::function<void(int32_t choice)> answered)
-    : wxPanel(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTAB_TRAVERSAL | wxBORDER_NONE, "UpdateThumbnailsBox"),
+    : wxPanel(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTAB_TRAVERSAL | wxBORDER_NONE,
+              "UpdateThumbnailsBox"),
       answered_(std::move(answered)) {
   SetBackgroundColour(BarColor());
   Bind(wxEVT_SYS_COLOUR_CHANGED, [this](wxSysColourChangedEvent& event) {
@@ -22,7 +23,8 @@ UpdateBar::UpdateBar(wxWindow* parent, std::function<void(int32_t choice)> answe
     event.Skip();
   });
   const int gap = FromDIP(6);
-  text_ = new wxStaticText(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxST_ELLIPSIZE_END);
+  text_ =
+      new wxStaticText(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxST_ELLIPSIZE_END);
   choices_ = new wxChoice(this, wxID_ANY);
   choices_->SetName(kThumbnailUpdateRequest);
   choices_->SetToolTip(kThumbnailUpdateRequest);
@@ -31,8 +33,8 @@ UpdateBar::UpdateBar(wxWindow* parent, std::function<void(int32_t choice)> answe
   }
   auto* ok = new wxButton(this, wxID_OK);
   ok_ = ok;
-  auto* close =
-      new wxButton(this, wxID_CLOSE, wxString::FromUTF8("\xC3\x97"), wxDefaultPosition, FromDIP(wxSize(32, -1)), wxBORDER_NONE);
+  auto* close = new wxButton(this, wxID_CLOSE, wxString::FromUTF8("\xC3\x97"), wxDefaultPosition,
+                             FromDIP(wxSize(32, -1)), wxBORDER_NONE);
   close->SetName(Label("Close"));  // the sign would be read as "times"
   close->SetToolTip(Label("Close"));
   auto* question = new wxBoxSizer(wxHORIZONTAL);
@@ -45,8 +47,9 @@ UpdateBar::UpdateBar(wxWindow* parent, std::function<void(int32_t choice)> answe
   sizer->Add(question, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxTOP, gap));
   sizer->Add(answer, wxSizerFlags().Expand().Border(wxALL, gap));
   SetSizer(sizer);
-  ok->Bind(wxEVT_BUTTON,
-           [this](wxCommandEvent&) { answered_(kThumbnailUpdateChoices[static_cast<size_t>(choices_->GetSelection())].value); });
+  ok->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) {
+    answered_(kThumbnailUpdateChoices[static_cast<size_t>(choices_->GetSelection())].value);
+  });
   close->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { answered_(0); });
 }
 

@@ -22,7 +22,8 @@ UpdateOffer::~UpdateOffer() {
   if (offer_ != nullptr) offer_->Stop();
 }
 
-void UpdateOffer::Offer(const std::string& folder, std::vector<std::string> files, const BrowserModes& modes) {
+void UpdateOffer::Offer(const std::string& folder, std::vector<std::string> files,
+                        const BrowserModes& modes) {
   if (offered_) return;
   offered_ = true;
   ThumbnailBrowser browser;

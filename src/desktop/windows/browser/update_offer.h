@@ -14,7 +14,8 @@ namespace fotomill::desktop {
 
 class UpdateBar;
 
-// A browser's offer to make the missing thumbnail files of its folder: the bar above the list, and what continues behind it.
+// A browser's offer to make the missing thumbnail files of its folder: the bar above the list, and
+// what continues behind it.
 class UpdateOffer {
  public:
   // What the browser has to follow.

@@ -29,9 +29,11 @@ namespace fotomill::desktop {
 
 namespace {
 
-constexpr uint64_t kNoLimit = std::numeric_limits<uint64_t>::max();  // all pictures are on the screen: none can be given back
+// all pictures are on the screen: none can be given back
+constexpr uint64_t kNoLimit = std::numeric_limits<uint64_t>::max();
 constexpr int kAcross = 2;                                           // panes beside each other
-constexpr int kFrameWidth = 3;                                       // around the pane with the focus
+// around the pane with the focus
+constexpr int kFrameWidth = 3;
 
 template <void (CompareFrame::*action)()>
 void Of(CompareFrame& compare) {
@@ -83,13 +85,14 @@ std::span<const KeyCommand<CompareFrame>> Commands() { return kCommands; }
 }  // namespace
 
 CompareFrame::CompareFrame(Shell& shell, const std::vector<std::string>& files)
-    : wxFrame(&shell.Window(), wxID_ANY, Label("Compare"), wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE,
-              "FotomillProfessionalCompare"),
+    : wxFrame(&shell.Window(), wxID_ANY, Label("Compare"), wxDefaultPosition, wxDefaultSize,
+              wxDEFAULT_FRAME_STYLE, "FotomillProfessionalCompare"),
       shell_(shell) {
   SetSize(shell.Window().GetSize());
   for (const std::string& file : files) panes_.push_back(BuildPane(file));
   place_ = panes_.front().canvas->Place();
-  loader_ = std::make_unique<ViewLoader>(kNoLimit, [this] { CallAfter([this] { PicturesCame(); }); });
+  loader_ =
+      std::make_unique<ViewLoader>(kNoLimit, [this] { CallAfter([this] { PicturesCame(); }); });
   CreateStatusBar();
   ArrangePanes();
   panes_.front().canvas->SetFocus();
@@ -102,8 +105,8 @@ CompareFrame::~CompareFrame() { loader_.reset(); }  // its thread calls back int
 CompareFrame::Pane CompareFrame::BuildPane(const std::string& path) {
   auto* panel = new wxPanel(this);
   Pane pane{path, panel, nullptr,
-            new wxStaticText(panel, wxID_ANY, Shown(platform::FileNameOf(path)), wxDefaultPosition, wxDefaultSize,
-                             wxST_ELLIPSIZE_MIDDLE)};
+            new wxStaticText(panel, wxID_ANY, Shown(platform::FileNameOf(path)), wxDefaultPosition,
+                             wxDefaultSize, wxST_ELLIPSIZE_MIDDLE)};
   // The events need the canvas that they come from, which is not there yet.
   const auto self = std::make_shared<ViewCanvas*>(nullptr);
   pane.canvas = new ViewCanvas(panel, {.resized = [this] { WantPictures(); },
@@ -118,11 +121,13 @@ CompareFrame::Pane CompareFrame::BuildPane(const std::string& path) {
   });
   canvas->Bind(wxEVT_RIGHT_DOWN, [this, canvas](wxMouseEvent& event) {
     canvas->SetFocus();
-    if (settings.RightClickMenuInView != 0) ShowCommandMenu(Commands(), *this, *canvas, event.GetPosition());
+    if (settings.RightClickMenuInView != 0)
+      ShowCommandMenu(Commands(), *this, *canvas, event.GetPosition());
   });
   auto* rows = new wxBoxSizer(wxVERTICAL);
   rows->Add(canvas, wxSizerFlags(1).Expand().Border(wxALL, FromDIP(kFrameWidth)));
-  rows->Add(pane.caption, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, FromDIP(kFrameWidth)));
+  rows->Add(pane.caption,
+            wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, FromDIP(kFrameWidth)));
   panel->SetSizer(rows);
   return pane;
 }
@@ -134,7 +139,8 @@ void CompareFrame::ArrangePanes() {
   for (const Pane& pane : panes_) grid->Add(pane.panel, wxSizerFlags(1).Expand());
   SetSizer(grid);
   Layout();
-  SetTitle(LabelCount("Compare - %1 picture", "Compare - %1 pictures", static_cast<uint64_t>(count)));
+  SetTitle(
+      LabelCount("Compare - %1 picture", "Compare - %1 pictures", static_cast<uint64_t>(count)));
 }
 
 size_t CompareFrame::PaneOf(const ViewCanvas* canvas) const {
@@ -166,14 +172,16 @@ void CompareFrame::PicturesCame() {
 void CompareFrame::FilesChanged() {
   for (const Pane& pane : panes_) {
     const ViewPicturePointer& shown = pane.canvas->Picture();
-    if (shown != nullptr && shown->HasChanged() && platform::IsRegularFile(pane.path)) loader_->Forget(pane.path);
+    if (shown != nullptr && shown->HasChanged() && platform::IsRegularFile(pane.path))
+      loader_->Forget(pane.path);
   }
   WantPictures();
 }
 
 void CompareFrame::ShowPicture(Pane& pane, ViewPicturePointer picture) {
-  LogEvent("compare", "pane=" + std::to_string(PaneOf(pane.canvas) + 1) + "/" + std::to_string(panes_.size()) +
-                          " status=" + std::to_string(StatusNumber(picture->status)) + " file=" + pane.path);
+  LogEvent("compare",
+           "pane=" + std::to_string(PaneOf(pane.canvas) + 1) + "/" + std::to_string(panes_.size()) +
+               " status=" + std::to_string(StatusNumber(picture->status)) + " file=" + pane.path);
   if (picture->picture != nullptr) shell_.Uses().Note({FileUse{pane.path, FileFunction::View}});
   pane.canvas->Show(std::move(picture));
   if (joined_) pane.canvas->SetPlace(place_);
@@ -189,7 +197,8 @@ void CompareFrame::Placed(const ViewCanvas* canvas) {
     }
   }
   std::string zooms;
-  for (const Pane& pane : panes_) zooms += " " + std::to_string(std::lround(pane.canvas->Zoom() * 100)) + "%";
+  for (const Pane& pane : panes_)
+    zooms += " " + std::to_string(std::lround(pane.canvas->Zoom() * 100)) + "%";
   LogEvent("compare-zoom", "joined=" + std::to_string(joined_ ? 1 : 0) + zooms);
 }
 
@@ -198,13 +207,16 @@ void CompareFrame::Focused(size_t pane) {
   focus_ = pane;
   for (const Pane& each : panes_) {
     const bool own = &each == &panes_[focus_];
-    each.panel->SetBackgroundColour(wxSystemSettings::GetColour(own ? wxSYS_COLOUR_HIGHLIGHT : wxSYS_COLOUR_FRAMEBK));
-    each.caption->SetForegroundColour(wxSystemSettings::GetColour(own ? wxSYS_COLOUR_HIGHLIGHTTEXT : wxSYS_COLOUR_WINDOWTEXT));
+    each.panel->SetBackgroundColour(
+        wxSystemSettings::GetColour(own ? wxSYS_COLOUR_HIGHLIGHT : wxSYS_COLOUR_FRAMEBK));
+    each.caption->SetForegroundColour(
+        wxSystemSettings::GetColour(own ? wxSYS_COLOUR_HIGHLIGHTTEXT : wxSYS_COLOUR_WINDOWTEXT));
     each.caption->SetFont(own ? GetFont().Bold() : GetFont());
     each.panel->Refresh();
   }
-  SetStatusText(joined_ ? Label("%1 of %2, zoomed and moved together", focus_ + 1, panes_.size())
-                        : Label("%1 of %2, zoomed and moved separately", focus_ + 1, panes_.size()));
+  SetStatusText(joined_
+                    ? Label("%1 of %2, zoomed and moved together", focus_ + 1, panes_.size())
+                    : Label("%1 of %2, zoomed and moved separately", focus_ + 1, panes_.size()));
   LogEvent("compare-focus", std::to_string(focus_ + 1) + "/" + std::to_string(panes_.size()));
 }
 
@@ -213,9 +225,10 @@ void CompareFrame::ShowFacts(const ViewCanvas* canvas) {
   if (place >= panes_.size()) return;
   const Pane& pane = panes_[place];
   const ViewPicturePointer& shown = canvas->Picture();
-  const std::string facts = shown == nullptr            ? std::string(Tr("loading..."))
-                            : shown->picture == nullptr ? Tr(StatusMessage(shown->status))
-                                                        : SizeAndZoom(*shown->picture, canvas->Zoom());
+  const std::string facts = shown == nullptr ? std::string(Tr("loading..."))
+                            : shown->picture == nullptr
+                                ? Tr(StatusMessage(shown->status))
+                                : SizeAndZoom(*shown->picture, canvas->Zoom());
   const wxString name = Shown(platform::FileNameOf(pane.path));
   pane.caption->SetLabel(name + "   " + Shown(facts));
   ReportToScreenReader(*pane.canvas, name, Shown(facts));
@@ -231,7 +244,8 @@ void CompareFrame::ToggleJoined() {
 
 void CompareFrame::StepPane(int panes) {
   const int count = static_cast<int>(panes_.size());
-  panes_[static_cast<size_t>((static_cast<int>(focus_) + panes + count) % count)].canvas->SetFocus();
+  panes_[static_cast<size_t>((static_cast<int>(focus_) + panes + count) % count)]
+      .canvas->SetFocus();
 }
 
 void CompareFrame::ToggleFullScreen() { ShowFullScreen(!IsFullScreen()); }
@@ -277,13 +291,15 @@ void CompareFrame::OnKey(wxKeyEvent& event) {
   if (Canvas().PanByKey(key)) return;
   if (event.AltDown() && key == WXK_RETURN) return ShowInfoWindow();
   if (event.AltDown() || event.ControlDown()) return event.Skip();
-  if (const KeyCommand<CompareFrame>* command = CommandOfKey(Commands(), key)) return command->run(*this);
+  if (const KeyCommand<CompareFrame>* command = CommandOfKey(Commands(), key))
+    return command->run(*this);
   event.Skip();
 }
 
 void CompareSelection(Shell& shell) {
   std::vector<std::string> files = shell.Tabs().SelectedFiles();
-  if (!CompareFrame::CanShow(files.size())) return shell.Report(Tr("Select two to four files to compare."));
+  if (!CompareFrame::CanShow(files.size()))
+    return shell.Report(Tr("Select two to four files to compare."));
   (new CompareFrame(shell, files))->Show();
 }
 

@@ -15,7 +15,8 @@ namespace fotomill::desktop {
 
 class Shell;
 
-// Two to four pictures beside each other, zoomed and moved together in parts of each. Commands go to the pane with the focus.
+// Two to four pictures beside each other, zoomed and moved together in parts of each. Commands go
+// to the pane with the focus.
 class CompareFrame : public wxFrame {
  public:
   // Whether so many files can be compared.

@@ -19,7 +19,8 @@ namespace fotomill::desktop {
 namespace {
 
 wxString LineOf(const Command& command) {
-  wxString line = wxControl::RemoveMnemonics(Label(command.menu)) + ": " + wxControl::RemoveMnemonics(Label(command.text));
+  wxString line = wxControl::RemoveMnemonics(Label(command.menu)) + ": " +
+                  wxControl::RemoveMnemonics(Label(command.text));
   if (*command.accelerator != '\0') line += wxString("    ") + command.accelerator;
   return line;
 }
@@ -35,9 +36,10 @@ bool HoldsEveryWord(const wxString& text, const wxString& words) {
 class FinderBox : public wxDialog {
  public:
   explicit FinderBox(wxWindow* parent)
-      : wxDialog(parent, wxID_ANY, Label("Find command"), wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
-                 "FindCommandBox") {
-    words_ = new wxTextCtrl(this, wxID_ANY, wxEmptyString, wxDefaultPosition, FromDIP(wxSize(420, -1)), wxTE_PROCESS_ENTER);
+      : wxDialog(parent, wxID_ANY, Label("Find command"), wxDefaultPosition, wxDefaultSize,
+                 wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "FindCommandBox") {
+    words_ = new wxTextCtrl(this, wxID_ANY, wxEmptyString, wxDefaultPosition,
+                            FromDIP(wxSize(420, -1)), wxTE_PROCESS_ENTER);
     words_->SetHint(Label("Words of the command name"));
     words_->SetName(Label("Words of the command name"));
     list_ = new wxListBox(this, wxID_ANY, wxDefaultPosition, FromDIP(wxSize(420, 300)));
@@ -66,7 +68,9 @@ class FinderBox : public wxDialog {
     found_.clear();
     wxArrayString lines;
     for (const Command& command : Commands()) {
-      if (command.text == nullptr || !HoldsEveryWord(LineOf(command) + " " + Label(command.help), words_->GetValue())) continue;
+      if (command.text == nullptr ||
+          !HoldsEveryWord(LineOf(command) + " " + Label(command.help), words_->GetValue()))
+        continue;
       found_.push_back(&command);
       lines.Add(LineOf(command));
     }

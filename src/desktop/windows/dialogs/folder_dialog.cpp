@@ -13,14 +13,16 @@
 
 namespace fotomill::desktop {
 
-std::optional<std::string> AskForFolder(wxWindow& parent, const wxString& title, const wxString& verb, HistoryList history) {
-  wxDialog dialog(&parent, wxID_ANY, title, wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
-                  "FolderBox");
+std::optional<std::string> AskForFolder(wxWindow& parent, const wxString& title,
+                                        const wxString& verb, HistoryList history) {
+  wxDialog dialog(&parent, wxID_ANY, title, wxDefaultPosition, wxDefaultSize,
+                  wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "FolderBox");
   const int gap = dialog.FromDIP(10);
   auto* sizer = new wxBoxSizer(wxVERTICAL);
   auto* row = new wxBoxSizer(wxHORIZONTAL);
-  auto* folder = new wxComboBox(&dialog, wxID_ANY, "", wxDefaultPosition, dialog.FromDIP(wxSize(460, -1)), 0, nullptr,
-                                wxTE_PROCESS_ENTER, wxDefaultValidator, Label("Folder"));
+  auto* folder =
+      new wxComboBox(&dialog, wxID_ANY, "", wxDefaultPosition, dialog.FromDIP(wxSize(460, -1)), 0,
+                     nullptr, wxTE_PROCESS_ENTER, wxDefaultValidator, Label("Folder"));
   for (const std::string& entry : LoadHistoryList(history)) {
     if (entry != kDefaultEntry) folder->Append(wxString::FromUTF8(entry));
   }
@@ -39,7 +41,9 @@ std::optional<std::string> AskForFolder(wxWindow& parent, const wxString& title,
   dialog.SetSizerAndFit(sizer);
   dialog.CentreOnParent();
   ok->SetDefault();
-  const auto isFolder = [&] { return platform::IsFolder(platform::AbsolutePath(Utf8(folder->GetValue()))); };
+  const auto isFolder = [&] {
+    return platform::IsFolder(platform::AbsolutePath(Utf8(folder->GetValue())));
+  };
   const auto update = [&] { ok->Enable(!folder->GetValue().empty() && isFolder()); };
   folder->Bind(wxEVT_TEXT, [&](wxCommandEvent&) { update(); });
   folder->Bind(wxEVT_COMBOBOX, [&](wxCommandEvent&) { update(); });

@@ -26,23 +26,30 @@ constexpr const char* kTitle = TrLater("Plug-ins");
 }  // namespace
 
 PluginBox::PluginBox(wxWindow* parent)
-    : wxDialog(parent, wxID_ANY, Label(kTitle), wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
-               "PluginBox") {
+    : wxDialog(parent, wxID_ANY, Label(kTitle), wxDefaultPosition, wxDefaultSize,
+               wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "PluginBox") {
   const int gap = FromDIP(10);
-  list_ = new wxDataViewListCtrl(this, wxID_ANY, wxDefaultPosition, FromDIP(wxSize(820, 220)), wxDV_SINGLE | wxDV_ROW_LINES);
+  list_ = new wxDataViewListCtrl(this, wxID_ANY, wxDefaultPosition, FromDIP(wxSize(820, 220)),
+                                 wxDV_SINGLE | wxDV_ROW_LINES);
   list_->SetName(Label(kTitle));
   list_->AppendToggleColumn(Label("On"), wxDATAVIEW_CELL_ACTIVATABLE, FromDIP(50), wxALIGN_CENTER);
   struct Column {
     const char* title;
     int width;
   };
-  for (const Column& column : {Column{TrLater("Extension"), 90}, {TrLater("Plug-in"), 140}, {TrLater("Formats"), 200}, {TrLater("Supports"), 150}, {TrLater("Module"), 150}}) {
-    list_->AppendTextColumn(Label(column.title), wxDATAVIEW_CELL_INERT, TextWidth(*this, column.width));
+  for (const Column& column : {Column{TrLater("Extension"), 90},
+                               {TrLater("Plug-in"), 140},
+                               {TrLater("Formats"), 200},
+                               {TrLater("Supports"), 150},
+                               {TrLater("Module"), 150}}) {
+    list_->AppendTextColumn(Label(column.title), wxDATAVIEW_CELL_INERT,
+                            TextWidth(*this, column.width));
   }
   const std::string folder = platform::JoinFolder(platform::ProgramFolder(), "plugin");
-  auto* place = new wxStaticText(this, wxID_ANY, Label("Plug-in folder: %1", Shown(folder)), wxDefaultPosition, wxDefaultSize,
-                                 wxST_ELLIPSIZE_MIDDLE);
-  note_ = new wxStaticText(this, wxID_ANY, Label("Changes take effect at the next start of the program."));
+  auto* place = new wxStaticText(this, wxID_ANY, Label("Plug-in folder: %1", Shown(folder)),
+                                 wxDefaultPosition, wxDefaultSize, wxST_ELLIPSIZE_MIDDLE);
+  note_ = new wxStaticText(this, wxID_ANY,
+                           Label("Changes take effect at the next start of the program."));
   auto* buttons = new wxBoxSizer(wxHORIZONTAL);
   buttons->Add(new wxButton(this, wxID_PREFERENCES, Label("&Configure...")));
   buttons->AddStretchSpacer();
@@ -55,11 +62,13 @@ PluginBox::PluginBox(wxWindow* parent)
   SetSizerAndFit(column);
   Bind(
       wxEVT_BUTTON, [this](wxCommandEvent&) { Configure(); }, wxID_PREFERENCES);
-  list_->Bind(wxEVT_DATAVIEW_ITEM_VALUE_CHANGED, [this](wxDataViewEvent& event) { Turn(list_->ItemToRow(event.GetItem())); });
+  list_->Bind(wxEVT_DATAVIEW_ITEM_VALUE_CHANGED,
+              [this](wxDataViewEvent& event) { Turn(list_->ItemToRow(event.GetItem())); });
   list_->Bind(wxEVT_CHAR_HOOK, [this](wxKeyEvent& event) {
     const int line = list_->GetSelectedRow();
     if (event.GetKeyCode() != WXK_SPACE || line == wxNOT_FOUND) return event.Skip();
-    list_->SetToggleValue(!list_->GetToggleValue(static_cast<unsigned>(line), 0), static_cast<unsigned>(line), 0);
+    list_->SetToggleValue(!list_->GetToggleValue(static_cast<unsigned>(line), 0),
+                          static_cast<unsigned>(line), 0);
     Turn(line);
   });
   list_->Bind(wxEVT_DATAVIEW_ITEM_ACTIVATED, [this](wxDataViewEvent&) { Configure(); });
@@ -73,20 +82,23 @@ void PluginBox::FillList() {
   for (const PluginModule& module : PluginModules()) AddModule(module);
   int selected = lines_.empty() ? wxNOT_FOUND : 0;
   for (size_t line = 0; line < lines_.size(); ++line) {
-    if (lines_[line].row >= 0 && lines_[line].row == settings.PluginConfigIndex) selected = static_cast<int>(line);
+    if (lines_[line].row >= 0 && lines_[line].row == settings.PluginConfigIndex)
+      selected = static_cast<int>(line);
   }
   if (selected != wxNOT_FOUND) list_->SetCurrentItem(list_->RowToItem(selected));
   FindWindow(wxID_PREFERENCES)->Enable(PluginFormatCount() > 0);
-  LogEvent("plugins", "lines=" + std::to_string(lines_.size()) + " formats=" + std::to_string(PluginFormatCount()));
+  LogEvent("plugins", "lines=" + std::to_string(lines_.size()) +
+                          " formats=" + std::to_string(PluginFormatCount()));
 }
 
 // One line for each format of a module; one for a module that is not loaded.
 void PluginBox::AddModule(const PluginModule& module) {
-  const auto add = [&](int32_t row, std::string_view extension, std::string_view plugin, std::string_view formats,
-                       std::string_view can) {
+  const auto add = [&](int32_t row, std::string_view extension, std::string_view plugin,
+                       std::string_view formats, std::string_view can) {
     wxVector<wxVariant> cells;
     cells.push_back(module.on);
-    for (const std::string_view cell : {extension, plugin, formats, can, std::string_view(module.name)})
+    for (const std::string_view cell :
+         {extension, plugin, formats, can, std::string_view(module.name)})
       cells.push_back(Shown(cell));
     list_->AppendItem(cells);
     lines_.push_back({module.name, row});
@@ -108,7 +120,8 @@ void PluginBox::Turn(int line) {
   const std::string name = lines_[static_cast<size_t>(line)].module;
   const bool on = list_->GetToggleValue(static_cast<unsigned>(line), 0);
   for (unsigned other = 0; other < lines_.size(); ++other) {
-    if (lines_[other].module == name && list_->GetToggleValue(other, 0) != on) list_->SetToggleValue(on, other, 0);
+    if (lines_[other].module == name && list_->GetToggleValue(other, 0) != on)
+      list_->SetToggleValue(on, other, 0);
   }
   for (const PluginModule& module : PluginModules()) {
     if (module.name != name || module.on == on) continue;
@@ -122,7 +135,8 @@ void PluginBox::Configure() {
   const int line = list_->GetSelectedRow();
   if (line == wxNOT_FOUND) return;
   const int32_t row = lines_[static_cast<size_t>(line)].row;
-  if (row < 0 || !ConfigurePluginRow(row)) wxMessageBox(Label(kNothingToConfigure.data()), Label(kTitle), wxOK | wxICON_INFORMATION, this);
+  if (row < 0 || !ConfigurePluginRow(row))
+    wxMessageBox(Label(kNothingToConfigure.data()), Label(kTitle), wxOK | wxICON_INFORMATION, this);
 }
 
 }  // namespace fotomill::desktop

@@ -12,7 +12,8 @@ class wxStaticText;
 
 namespace fotomill::desktop {
 
-// The formats of all plug-ins, what each can do, the switches of their modules, and the way to their own settings.
+// The formats of all plug-ins, what each can do, the switches of their modules, and the way to
+// their own settings.
 class PluginBox : public wxDialog {
  public:
   explicit PluginBox(wxWindow* parent);

@@ -23,16 +23,22 @@ wxString& LastPattern() {
 }  // namespace
 
 bool AskAndSelect(wxWindow& parent, BrowserModel& model) {
-  wxDialog dialog(&parent, wxID_ANY, Label("Select by pattern"), wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE, "SelectBox");
+  wxDialog dialog(&parent, wxID_ANY, Label("Select by pattern"), wxDefaultPosition, wxDefaultSize,
+                  wxDEFAULT_DIALOG_STYLE, "SelectBox");
   const int gap = dialog.FromDIP(10);
   auto* sizer = new wxBoxSizer(wxVERTICAL);
-  sizer->Add(new wxStaticText(&dialog, wxID_ANY, Label("&Names that contain this text or match this pattern (*, ?):")),
+  sizer->Add(new wxStaticText(&dialog, wxID_ANY,
+                              Label("&Names that contain this text or match this pattern (*, ?):")),
              wxSizerFlags().Border(wxALL, gap));
-  auto* pattern = new wxTextCtrl(&dialog, wxID_ANY, LastPattern(), wxDefaultPosition, dialog.FromDIP(wxSize(320, -1)), 0,
-                                 wxDefaultValidator, Label("Pattern"));
+  auto* pattern =
+      new wxTextCtrl(&dialog, wxID_ANY, LastPattern(), wxDefaultPosition,
+                     dialog.FromDIP(wxSize(320, -1)), 0, wxDefaultValidator, Label("Pattern"));
   sizer->Add(pattern, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT, gap));
-  const wxString modes[] = {Label("&Replace the selection"), Label("&Add to the selection"), Label("Re&move from the selection")};  // as MatchMode
-  auto* mode = new wxRadioBox(&dialog, wxID_ANY, Label("Selection"), wxDefaultPosition, wxDefaultSize, 3, modes, 1, wxRA_SPECIFY_ROWS);
+  // as MatchMode
+  const wxString modes[] = {Label("&Replace the selection"), Label("&Add to the selection"),
+                            Label("Re&move from the selection")};
+  auto* mode = new wxRadioBox(&dialog, wxID_ANY, Label("Selection"), wxDefaultPosition,
+                              wxDefaultSize, 3, modes, 1, wxRA_SPECIFY_ROWS);
   sizer->Add(mode, wxSizerFlags().Expand().Border(wxALL, gap));
   auto* buttons = new wxBoxSizer(wxHORIZONTAL);
   auto* ok = new wxButton(&dialog, wxID_OK, Label("S&elect"));

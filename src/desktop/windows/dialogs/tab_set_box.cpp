@@ -22,7 +22,8 @@ namespace {
 constexpr const char* kTitle = TrLater("Tab sets");
 
 bool Confirm(wxWindow& parent, const wxString& question, const wxString& verb) {
-  wxMessageDialog dialog(&parent, question, Label(kTitle), wxOK | wxCANCEL | wxCANCEL_DEFAULT | wxICON_WARNING);
+  wxMessageDialog dialog(&parent, question, Label(kTitle),
+                         wxOK | wxCANCEL | wxCANCEL_DEFAULT | wxICON_WARNING);
   dialog.SetOKLabel("&" + verb);
   LogEvent("prompt", "tab-set");
   return dialog.ShowModal() == wxID_OK;
@@ -32,13 +33,14 @@ bool Confirm(wxWindow& parent, const wxString& question, const wxString& verb) {
 class TabSetBox : public wxDialog {
  public:
   explicit TabSetBox(wxWindow& parent)
-      : wxDialog(&parent, wxID_ANY, Label(kTitle), wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
-                 "TabSetBox") {
+      : wxDialog(&parent, wxID_ANY, Label(kTitle), wxDefaultPosition, wxDefaultSize,
+                 wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "TabSetBox") {
     const int gap = FromDIP(10);
     auto* sizer = new wxBoxSizer(wxVERTICAL);
-    sizer->Add(new wxStaticText(this, wxID_ANY, Label("&Tab sets:")), wxSizerFlags().Border(wxLEFT | wxRIGHT | wxTOP, gap));
-    list_ = new wxListBox(this, wxID_ANY, wxDefaultPosition, FromDIP(wxSize(320, 200)), 0, nullptr, wxLB_SINGLE,
-                          wxDefaultValidator, Label("Tab sets"));
+    sizer->Add(new wxStaticText(this, wxID_ANY, Label("&Tab sets:")),
+               wxSizerFlags().Border(wxLEFT | wxRIGHT | wxTOP, gap));
+    list_ = new wxListBox(this, wxID_ANY, wxDefaultPosition, FromDIP(wxSize(320, 200)), 0, nullptr,
+                          wxLB_SINGLE, wxDefaultValidator, Label("Tab sets"));
     sizer->Add(list_, wxSizerFlags(1).Expand().Border(wxALL, gap));
     auto* row = new wxBoxSizer(wxHORIZONTAL);
     delete_ = new wxButton(this, wxID_DELETE, Label("&Delete..."));
@@ -67,7 +69,8 @@ class TabSetBox : public wxDialog {
   void Refill() {
     names_ = TabSetNames();
     list_->Clear();
-    for (const std::string& name : names_) list_->Append(name == CurrentTabSet() ? Label("%1 (in use)", Shown(name)) : Shown(name));
+    for (const std::string& name : names_)
+      list_->Append(name == CurrentTabSet() ? Label("%1 (in use)", Shown(name)) : Shown(name));
     if (!names_.empty()) list_->SetSelection(0);
     UpdateControls();
   }
@@ -78,8 +81,13 @@ class TabSetBox : public wxDialog {
   }
   void DeleteChosen() {
     const std::string chosen = Chosen();
-    if (!Confirm(*this, Label("Delete the tab set \"%1\"? The folders are not deleted.", Shown(chosen)), Label("Delete"))) return;
-    if (!DeleteTabSet(chosen)) wxMessageBox(Label("The tab set could not be deleted."), Label(kTitle), wxOK | wxICON_WARNING, this);
+    if (!Confirm(*this,
+                 Label("Delete the tab set \"%1\"? The folders are not deleted.", Shown(chosen)),
+                 Label("Delete")))
+      return;
+    if (!DeleteTabSet(chosen))
+      wxMessageBox(Label("The tab set could not be deleted."), Label(kTitle), wxOK | wxICON_WARNING,
+                   this);
     Refill();
   }
 
@@ -92,16 +100,21 @@ class TabSetBox : public wxDialog {
 }  // namespace
 
 std::optional<std::string> AskForTabSetName(wxWindow& parent) {
-  wxTextEntryDialog dialog(&parent, Label("Name of the tab set:"), Label("Save tabs"), Shown(CurrentTabSet()));
+  wxTextEntryDialog dialog(&parent, Label("Name of the tab set:"), Label("Save tabs"),
+                           Shown(CurrentTabSet()));
   LogEvent("prompt", "tab-set-name");
   while (dialog.ShowModal() == wxID_OK) {
     const std::string name = Utf8(dialog.GetValue());
     if (TabSetFile(name).empty()) {
-      wxMessageBox(Label("This name cannot be used."), Label("Save tabs"), wxOK | wxICON_WARNING, &parent);
+      wxMessageBox(Label("This name cannot be used."), Label("Save tabs"), wxOK | wxICON_WARNING,
+                   &parent);
       continue;
     }
     const bool other = name != CurrentTabSet() && HasTabSet(name);
-    if (!other || Confirm(parent, Label("The tab set \"%1\" already exists. Replace it?", Shown(name)), Label("Replace"))) return name;
+    if (!other ||
+        Confirm(parent, Label("The tab set \"%1\" already exists. Replace it?", Shown(name)),
+                Label("Replace")))
+      return name;
   }
   return std::nullopt;
 }

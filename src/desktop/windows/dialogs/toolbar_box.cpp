@@ -40,14 +40,17 @@ bool AskForToolbar(wxWindow& parent) {
     label.EndsWith("...", &label);
     labels.push_back(label);
   }
-  wxRearrangeDialog dialog(&parent, Label("Toolbar buttons and their order:"), Label(kTitle), order, labels);
+  wxRearrangeDialog dialog(&parent, Label("Toolbar buttons and their order:"), Label(kTitle), order,
+                           labels);
   dialog.GetList()->SetName(Label("Buttons"));
   dialog.GetList()->SetSelection(0);
   dialog.GetList()->SetFocus();
-  // Space turns the mark of the selected line from the start; of itself the list does so only after an arrow key.
+  // Space turns the mark of the selected line from the start; of itself the list does so only after
+  // an arrow key.
   dialog.Bind(wxEVT_CHAR_HOOK, [list = dialog.GetList()](wxKeyEvent& event) {
     const int line = list->GetSelection();
-    if (event.GetKeyCode() != WXK_SPACE || !list->HasFocus() || line == wxNOT_FOUND) return event.Skip();
+    if (event.GetKeyCode() != WXK_SPACE || !list->HasFocus() || line == wxNOT_FOUND)
+      return event.Skip();
     list->Check(static_cast<unsigned>(line), !list->IsChecked(static_cast<unsigned>(line)));
   });
   LogEvent("prompt", "toolbar");
@@ -57,7 +60,8 @@ bool AskForToolbar(wxWindow& parent) {
     buttons.push_back({before[static_cast<size_t>(place < 0 ? ~place : place)].name, place >= 0});
   }
   if (SaveToolbar(buttons)) return true;
-  wxMessageBox(Label("The toolbar could not be saved in the data folder."), Label(kTitle), wxOK | wxICON_WARNING, &parent);
+  wxMessageBox(Label("The toolbar could not be saved in the data folder."), Label(kTitle),
+               wxOK | wxICON_WARNING, &parent);
   return false;
 }
 

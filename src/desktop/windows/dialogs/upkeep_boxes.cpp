@@ -28,25 +28,32 @@ enum Database { kGlobal, kLocal };
 // --- compaction ---
 
 CompactionBox::CompactionBox(wxWindow* parent, const std::string& folder)
-    : wxDialog(parent, wxID_ANY, Label("Compact thumbnail database"), wxDefaultPosition, wxDefaultSize,
-               wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "CompactDatabaseBox"),
+    : wxDialog(parent, wxID_ANY, Label("Compact thumbnail database"), wxDefaultPosition,
+               wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "CompactDatabaseBox"),
       paths_{ThumbnailDatabasePath({}), ThumbnailDatabasePath(folder)} {
   const int gap = FromDIP(10);
   const wxString choices[] = {Label("&Global database"), Label("&Database of this folder")};
-  which_ = new wxRadioBox(this, wxID_ANY, Label("Database"), wxDefaultPosition, wxDefaultSize, 2, choices, 1, wxRA_SPECIFY_COLS);
-  if (!platform::FileExists(paths_[kGlobal]) && platform::FileExists(paths_[kLocal])) which_->SetSelection(kLocal);
-  facts_ = new wxStaticText(this, wxID_ANY, wxEmptyString, wxDefaultPosition, wxDefaultSize, wxST_ELLIPSIZE_MIDDLE);
+  which_ = new wxRadioBox(this, wxID_ANY, Label("Database"), wxDefaultPosition, wxDefaultSize, 2,
+                          choices, 1, wxRA_SPECIFY_COLS);
+  if (!platform::FileExists(paths_[kGlobal]) && platform::FileExists(paths_[kLocal]))
+    which_->SetSelection(kLocal);
+  facts_ = new wxStaticText(this, wxID_ANY, wxEmptyString, wxDefaultPosition, wxDefaultSize,
+                            wxST_ELLIPSIZE_MIDDLE);
   purge_ = new wxCheckBox(this, wxID_ANY, Label("Also remove thumbnails of &missing pictures"));
-  purge_->SetToolTip(Label("Pictures on network, optical and removable drives are never considered missing."));
+  purge_->SetToolTip(
+      Label("Pictures on network, optical and removable drives are never considered missing."));
   gauge_ = new wxGauge(this, wxID_ANY, 1000, wxDefaultPosition, FromDIP(wxSize(460, -1)));
   gauge_->SetName(Label("Progress"));
-  outcome_ = new wxStaticText(this, wxID_ANY, Label("Compacting removes thumbnails that are marked as deleted."));
+  outcome_ = new wxStaticText(this, wxID_ANY,
+                              Label("Compacting removes thumbnails that are marked as deleted."));
   auto* buttons = new wxBoxSizer(wxHORIZONTAL);
   buttons->AddStretchSpacer();
-  buttons->Add(new wxButton(this, wxID_OK, Label("Com&pact")), wxSizerFlags().Border(wxRIGHT, FromDIP(6)));
+  buttons->Add(new wxButton(this, wxID_OK, Label("Com&pact")),
+               wxSizerFlags().Border(wxRIGHT, FromDIP(6)));
   buttons->Add(new wxButton(this, wxID_CANCEL, Label("Close")));
   auto* column = new wxBoxSizer(wxVERTICAL);
-  for (wxWindow* window : std::initializer_list<wxWindow*>{which_, facts_, purge_, gauge_, outcome_}) {
+  for (wxWindow* window :
+       std::initializer_list<wxWindow*>{which_, facts_, purge_, gauge_, outcome_}) {
     column->Add(window, wxSizerFlags().Expand().Border(wxLEFT | wxTOP | wxRIGHT, gap));
   }
   column->AddStretchSpacer();
@@ -72,8 +79,8 @@ CompactionBox::CompactionBox(wxWindow* parent, const std::string& folder)
 void CompactionBox::Begin() {
   if (compaction_ != nullptr && !compaction_->Ended()) return;
   outcome_->SetLabel("Compacting...");
-  compaction_ = std::make_unique<DatabaseCompaction>(paths_[which_->GetSelection()], purge_->GetValue(),
-                                                     ThumbnailOptionsFromSettings().hidden);
+  compaction_ = std::make_unique<DatabaseCompaction>(
+      paths_[which_->GetSelection()], purge_->GetValue(), ThumbnailOptionsFromSettings().hidden);
   timer_.Start(kLookMs);
   UpdateControls();
 }
@@ -108,14 +115,16 @@ CleanUpBox::CleanUpBox(wxWindow* parent, const std::string& folder)
                wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "CleanUpThumbnailsBox"),
       folder_(folder) {
   const int gap = FromDIP(10);
-  auto* place = new wxStaticText(this, wxID_ANY, Label("Thumbnail files without a picture in %1", Shown(folder)));
+  auto* place = new wxStaticText(this, wxID_ANY,
+                                 Label("Thumbnail files without a picture in %1", Shown(folder)));
   below_ = new wxCheckBox(this, wxID_ANY, Label("Include su&bfolders"));
   list_ = new wxListBox(this, wxID_ANY, wxDefaultPosition, FromDIP(wxSize(560, 240)));
   list_->SetName(Label("Thumbnail files"));
   outcome_ = new wxStaticText(this, wxID_ANY, wxEmptyString);
   auto* buttons = new wxBoxSizer(wxHORIZONTAL);
   buttons->AddStretchSpacer();
-  buttons->Add(new wxButton(this, wxID_DELETE, Label("&Delete")), wxSizerFlags().Border(wxRIGHT, FromDIP(6)));
+  buttons->Add(new wxButton(this, wxID_DELETE, Label("&Delete")),
+               wxSizerFlags().Border(wxRIGHT, FromDIP(6)));
   buttons->Add(new wxButton(this, wxID_CANCEL, Label("Close")));
   auto* column = new wxBoxSizer(wxVERTICAL);
   for (wxWindow* window : std::initializer_list<wxWindow*>{place, below_}) {
@@ -147,10 +156,12 @@ void CleanUpBox::Search() {
 void CleanUpBox::Found() {
   wxArrayString lines;
   for (size_t i = 0; i < std::min(orphans_.size(), kMostLines); ++i) lines.Add(Shown(orphans_[i]));
-  if (orphans_.size() > kMostLines) lines.Add(LabelCount("... and %1 more", "... and %1 more", orphans_.size() - kMostLines));
+  if (orphans_.size() > kMostLines)
+    lines.Add(LabelCount("... and %1 more", "... and %1 more", orphans_.size() - kMostLines));
   list_->Set(lines);
-  outcome_->SetLabel(orphans_.empty() ? Label("Nothing to clean up: every thumbnail file has its picture.")
-                                      : LabelCount("%1 file", "%1 files", orphans_.size()));
+  outcome_->SetLabel(orphans_.empty()
+                         ? Label("Nothing to clean up: every thumbnail file has its picture.")
+                         : LabelCount("%1 file", "%1 files", orphans_.size()));
   FindWindow(wxID_DELETE)->Enable(!orphans_.empty());
   Layout();
   LogEvent("cleanup", "orphans=" + std::to_string(orphans_.size()));
@@ -162,7 +173,9 @@ void CleanUpBox::Delete() {
   const size_t left = orphans_.size();
   Found();
   outcome_->SetLabel(left == 0 ? LabelCount("%1 file was deleted.", "%1 files were deleted.", all)
-                               : LabelCount("%1 of %2 files could not be deleted; it is listed.", "%1 of %2 files could not be deleted; they are listed.", left, all));
+                               : LabelCount("%1 of %2 files could not be deleted; it is listed.",
+                                            "%1 of %2 files could not be deleted; they are listed.",
+                                            left, all));
 }
 
 }  // namespace fotomill::desktop

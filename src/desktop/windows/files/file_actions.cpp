@@ -33,7 +33,8 @@ namespace {
 
 PastedPicture PictureOf(const wxBitmap& bitmap) {
   const wxImage image = bitmap.ConvertToImage();
-  const size_t count = static_cast<size_t>(image.GetWidth()) * static_cast<size_t>(image.GetHeight());
+  const size_t count =
+      static_cast<size_t>(image.GetWidth()) * static_cast<size_t>(image.GetHeight());
   PastedPicture picture;
   picture.pixels.width = image.GetWidth();
   picture.pixels.height = image.GetHeight();
@@ -42,14 +43,16 @@ PastedPicture PictureOf(const wxBitmap& bitmap) {
   return picture;
 }
 
-constexpr const char* kGnomeFiles = "x-special/gnome-copied-files";  // "cut" or "copy", then a URL a line
+// "cut" or "copy", then a URL a line
+constexpr const char* kGnomeFiles = "x-special/gnome-copied-files";
 constexpr size_t kMostFailuresShown = 10;
 
 std::string Count(size_t files) { return TrCount("%1 file", "%1 files", files); }
 
 }  // namespace
 
-FileActions::FileActions(Shell& shell) : shell_(shell), undo_(static_cast<size_t>(std::clamp(settings.UndoLevels, 1, 1000))) {}
+FileActions::FileActions(Shell& shell)
+    : shell_(shell), undo_(static_cast<size_t>(std::clamp(settings.UndoLevels, 1, 1000))) {}
 
 void FileActions::Run(const std::string& what, Work work, Then then) {
   if (busy_) return shell_.Report(Tr("Please wait for the previous file operation."));
@@ -72,10 +75,11 @@ void FileActions::Run(const std::string& what, Work work, Then then) {
 
 void FileActions::Finished(const std::string& what, FileOperationResult result, const Then& then) {
   busy_ = false;
-  const std::string done = result.failures.empty() ? what : Tr("%1, %2 failed", what, result.failures.size());
+  const std::string done =
+      result.failures.empty() ? what : Tr("%1, %2 failed", what, result.failures.size());
   shell_.Report(result.note.empty() ? done : done + ": " + result.note);
-  LogEvent("files",
-           what + " done=" + std::to_string(result.done.steps.size()) + " failed=" + std::to_string(result.failures.size()));
+  LogEvent("files", what + " done=" + std::to_string(result.done.steps.size()) +
+                        " failed=" + std::to_string(result.failures.size()));
   const std::vector<FileOperationFailure> failures = result.failures;
   then(std::move(result));
   shell_.FilesChanged();
@@ -88,18 +92,21 @@ void FileActions::ReportFailures(const std::vector<FileOperationFailure>& failur
   for (size_t i = 0; i < std::min(failures.size(), kMostFailuresShown); ++i) {
     text += Shown(platform::FileNameOf(failures[i].path)) + ": " + Shown(failures[i].reason) + "\n";
   }
-  if (failures.size() > kMostFailuresShown) text += LabelCount("and %1 more", "and %1 more", failures.size() - kMostFailuresShown);
+  if (failures.size() > kMostFailuresShown)
+    text += LabelCount("and %1 more", "and %1 more", failures.size() - kMostFailuresShown);
   wxMessageBox(text, Label("Some files failed"), wxOK | wxICON_WARNING, &shell_.Window());
 }
 
-void FileActions::Do(FileOperationKind kind, const std::vector<std::string>& paths, const std::string& folder) {
+void FileActions::Do(FileOperationKind kind, const std::vector<std::string>& paths,
+                     const std::string& folder) {
   if (paths.empty()) return;
   FileOperation name{kind, std::vector<FileStep>(paths.size(), FileStep{paths.front(), {}})};
   std::string what = FileOperationName(name);
   what[0] = static_cast<char>(what[0] - 'a' + 'A');
   Run(
       what,
-      [kind, paths, folder, options = FileOperationOptionsFromSettings()](const FileOperationProgress& progress) {
+      [kind, paths, folder,
+       options = FileOperationOptionsFromSettings()](const FileOperationProgress& progress) {
         return CarryOut(PlanFileOperation(kind, paths, folder, options), options, progress);
       },
       [this](FileOperationResult result) {
@@ -109,8 +116,10 @@ void FileActions::Do(FileOperationKind kind, const std::vector<std::string>& pat
 }
 
 void FileActions::Follow(const FileOperation& operation, bool back) {
-  if (operation.kind != FileOperationKind::Rename && operation.kind != FileOperationKind::Move) return;
-  for (const FileStep& step : operation.steps) shell_.FollowRename(back ? step.to : step.from, back ? step.from : step.to);
+  if (operation.kind != FileOperationKind::Rename && operation.kind != FileOperationKind::Move)
+    return;
+  for (const FileStep& step : operation.steps)
+    shell_.FollowRename(back ? step.to : step.from, back ? step.from : step.to);
 }
 
 bool FileActions::Trash(const std::vector<std::string>& paths) {
@@ -125,8 +134,8 @@ bool FileActions::TrashFromView(wxWindow* view, const std::string& path) {
     return false;
   }
   if (settings.PromptDeleteFromView != 0) {
-    wxMessageDialog dialog(view, Label("Move %1 to the trash?", Shown(platform::FileNameOf(path))), Label("Delete"),
-                           wxOK | wxCANCEL | wxICON_QUESTION);
+    wxMessageDialog dialog(view, Label("Move %1 to the trash?", Shown(platform::FileNameOf(path))),
+                           Label("Delete"), wxOK | wxCANCEL | wxICON_QUESTION);
     dialog.SetOKLabel("&Delete");
     if (dialog.ShowModal() != wxID_OK) return false;
   }
@@ -135,29 +144,41 @@ bool FileActions::TrashFromView(wxWindow* view, const std::string& path) {
 
 bool FileActions::Delete(const std::vector<std::string>& paths) {
   if (paths.empty()) return false;
-  const wxString what = paths.size() == 1 ? "\"" + Shown(platform::FileNameOf(paths.front())) + "\"" : Shown(Count(paths.size()));
-  const wxString why = platform::HasTrash(paths.front()) ? wxString() : Label("There is no trash for files of this folder.") + "\n";
-  wxMessageDialog dialog(&shell_.Window(), why + Label("Delete %1 permanently? This cannot be undone.", what), Label("Delete"),
-                         wxOK | wxCANCEL | wxCANCEL_DEFAULT | wxICON_WARNING);
+  const wxString what = paths.size() == 1 ? "\"" + Shown(platform::FileNameOf(paths.front())) + "\""
+                                          : Shown(Count(paths.size()));
+  const wxString why = platform::HasTrash(paths.front())
+                           ? wxString()
+                           : Label("There is no trash for files of this folder.") + "\n";
+  wxMessageDialog dialog(&shell_.Window(),
+                         why + Label("Delete %1 permanently? This cannot be undone.", what),
+                         Label("Delete"), wxOK | wxCANCEL | wxCANCEL_DEFAULT | wxICON_WARNING);
   dialog.SetOKLabel("&Delete");
   LogEvent("prompt", "delete");
   if (dialog.ShowModal() != wxID_OK) return false;
   Run(
-      Tr("Permanent deletion"), [paths](const FileOperationProgress& progress) { return DeleteForGood(paths, progress); }, [](FileOperationResult) {});
+      Tr("Permanent deletion"),
+      [paths](const FileOperationProgress& progress) { return DeleteForGood(paths, progress); },
+      [](FileOperationResult) {});
   return true;
 }
 
-void FileActions::CopyTo(const std::vector<std::string>& paths, const std::string& folder) { Do(FileOperationKind::Copy, paths, folder); }
-void FileActions::MoveTo(const std::vector<std::string>& paths, const std::string& folder) { Do(FileOperationKind::Move, paths, folder); }
+void FileActions::CopyTo(const std::vector<std::string>& paths, const std::string& folder) {
+  Do(FileOperationKind::Copy, paths, folder);
+}
+void FileActions::MoveTo(const std::vector<std::string>& paths, const std::string& folder) {
+  Do(FileOperationKind::Move, paths, folder);
+}
 
-void FileActions::Drop(const std::vector<std::string>& paths, const std::string& folder, bool move) {
+void FileActions::Drop(const std::vector<std::string>& paths, const std::string& folder,
+                       bool move) {
   Do(move ? FileOperationKind::Move : FileOperationKind::Copy, paths, folder);
 }
 
 void FileActions::Rename(const std::string& path, const std::string& name) {
   if (!IsPlainName(name)) {
-    wxMessageBox(Label("A name cannot contain \"%1\".", Shown(std::string(1, platform::kSeparator))), Label("Rename"), wxOK | wxICON_WARNING,
-                 &shell_.Window());
+    wxMessageBox(
+        Label("A name cannot contain \"%1\".", Shown(std::string(1, platform::kSeparator))),
+        Label("Rename"), wxOK | wxICON_WARNING, &shell_.Window());
     return;
   }
   RenameAll({{path, platform::JoinFolder(platform::SplitPath(path).folder, name)}});
@@ -169,13 +190,14 @@ void FileActions::RenameAll(std::vector<FileStep> steps) {
   const std::string shown(platform::FileNameOf(operation.steps.front().to));
   const bool one = operation.steps.size() == 1;
   Run(
-      Tr("Rename"), [operation, options = FileOperationOptionsFromSettings()](const FileOperationProgress& progress) {
-        return CarryOut(operation, options, progress);
-      },
+      Tr("Rename"),
+      [operation, options = FileOperationOptionsFromSettings()](
+          const FileOperationProgress& progress) { return CarryOut(operation, options, progress); },
       [this, one, shown](FileOperationResult result) {
         const bool done = !result.done.steps.empty();
         for (const FileStep& step : result.done.steps) {
-          shell_.Uses().Note({FileUse{step.from, FileFunction::MoveAndCopy, kOwnTime, kOwnTime, true}});
+          shell_.Uses().Note(
+              {FileUse{step.from, FileFunction::MoveAndCopy, kOwnTime, kOwnTime, true}});
         }
         Follow(result.done, false);
         undo_.Add(std::move(result.done));
@@ -190,11 +212,14 @@ void FileActions::NewFolder(const std::string& parent) {
   if (dialog.ShowModal() != wxID_OK) return;
   const std::string name = Utf8(dialog.GetValue());
   const std::string path = platform::JoinFolder(parent, name);
-  if (!IsPlainName(name) || name.empty() || platform::FileExists(path) || !platform::MakeFolders(path)) {
-    wxMessageBox(Label("The folder could not be created."), Label("New folder"), wxOK | wxICON_WARNING, &shell_.Window());
+  if (!IsPlainName(name) || name.empty() || platform::FileExists(path) ||
+      !platform::MakeFolders(path)) {
+    wxMessageBox(Label("The folder could not be created."), Label("New folder"),
+                 wxOK | wxICON_WARNING, &shell_.Window());
     return;
   }
-  if (BrowserPage* browser = shell_.Tabs().Front(); browser != nullptr && browser->Model().Folder() == parent)
+  if (BrowserPage* browser = shell_.Tabs().Front();
+      browser != nullptr && browser->Model().Folder() == parent)
     browser->Open(parent, name);
   shell_.FilesChanged();
 }
@@ -202,12 +227,13 @@ void FileActions::NewFolder(const std::string& parent) {
 bool FileActions::SaveTurned(const std::string& path, Orientation turn, Turned then) {
   if (busy_) return false;
   const auto work = [path, turn](const FileOperationProgress&) { return TurnOneFile(path, turn); };
-  Run(Tr("Rotation of %1", platform::FileNameOf(path)), work, [this, then = std::move(then)](FileOperationResult result) {
-    const bool done = !result.done.steps.empty();
-    const std::string note = result.note;
-    undo_.Add(std::move(result.done));
-    then(done, note);
-  });
+  Run(Tr("Rotation of %1", platform::FileNameOf(path)), work,
+      [this, then = std::move(then)](FileOperationResult result) {
+        const bool done = !result.done.steps.empty();
+        const std::string note = result.note;
+        undo_.Add(std::move(result.done));
+        then(done, note);
+      });
   return true;
 }
 
@@ -217,9 +243,9 @@ void FileActions::Undo() {
   if (!undo_.CanUndo() || busy_) return;
   const FileOperation operation = undo_.PopUndo();
   Run(
-      Tr("Undo %1", FileOperationName(operation)), [operation, options = FileOperationOptionsFromSettings()](const FileOperationProgress& progress) {
-        return Revert(operation, options, progress);
-      },
+      Tr("Undo %1", FileOperationName(operation)),
+      [operation, options = FileOperationOptionsFromSettings()](
+          const FileOperationProgress& progress) { return Revert(operation, options, progress); },
       [this](FileOperationResult result) {
         Follow(result.done, true);
         undo_.Undone(std::move(result.done));
@@ -230,9 +256,9 @@ void FileActions::Redo() {
   if (!undo_.CanRedo() || busy_) return;
   const FileOperation operation = undo_.PopRedo();
   Run(
-      Tr("Redo %1", FileOperationName(operation)), [operation, options = FileOperationOptionsFromSettings()](const FileOperationProgress& progress) {
-        return CarryOut(operation, options, progress);
-      },
+      Tr("Redo %1", FileOperationName(operation)),
+      [operation, options = FileOperationOptionsFromSettings()](
+          const FileOperationProgress& progress) { return CarryOut(operation, options, progress); },
       [this](FileOperationResult result) {
         Follow(result.done, false);
         undo_.Redone(std::move(result.done));
@@ -257,12 +283,14 @@ void FileActions::ToClipboard(const std::vector<std::string>& paths, bool cut) {
   both->Add(marked);
   const wxClipboardLocker clipboard;
   if (!clipboard || !wxTheClipboard->SetData(both)) return wxBell();
-  shell_.Report(cut ? TrCount("%1 file cut.", "%1 files cut.", paths.size()) : TrCount("%1 file copied.", "%1 files copied.", paths.size()));
+  shell_.Report(cut ? TrCount("%1 file cut.", "%1 files cut.", paths.size())
+                    : TrCount("%1 file copied.", "%1 files copied.", paths.size()));
 }
 
 void FileActions::PathsToClipboard(const std::vector<std::string>& paths) {
   wxString text;
-  for (const std::string& path : paths) text += (text.empty() ? "" : "\n") + wxString::FromUTF8(path);
+  for (const std::string& path : paths)
+    text += (text.empty() ? "" : "\n") + wxString::FromUTF8(path);
   const wxClipboardLocker clipboard;
   if (!clipboard || !wxTheClipboard->SetData(new wxTextDataObject(text))) wxBell();
 }
@@ -276,7 +304,8 @@ void FileActions::Paste(const std::string& folder) {
     if (!clipboard) return wxBell();
     if (!wxTheClipboard->GetData(files)) return PastePicture(folder);
     if (wxTheClipboard->GetData(marked)) {
-      cut = std::string(static_cast<const char*>(marked.GetData()), marked.GetSize()).starts_with("cut");
+      cut = std::string(static_cast<const char*>(marked.GetData()), marked.GetSize())
+                .starts_with("cut");
     }
     if (cut) wxTheClipboard->Clear();  // they can be moved once only
   }
@@ -293,7 +322,9 @@ void FileActions::PastePicture(const std::string& folder) {
   }
   Run(
       Tr("Paste"),
-      [picture = PictureOf(bitmap.GetBitmap()), folder](const FileOperationProgress&) { return KeepPastedPicture(picture, folder); },
+      [picture = PictureOf(bitmap.GetBitmap()), folder](const FileOperationProgress&) {
+        return KeepPastedPicture(picture, folder);
+      },
       [this](FileOperationResult result) {
         const std::vector<FileStep> made = result.done.steps;
         undo_.Add(std::move(result.done));
@@ -322,11 +353,13 @@ void AskAndDo(Shell& shell, const wxString& verb, const wxString& question,
 
 void CopySelectionTo(Shell& shell) {
   const size_t count = shell.Tabs().SelectedPaths().size();
-  AskAndDo(shell, Label("Copy"), LabelCount("Copy %1 file to", "Copy %1 files to", count), &FileActions::CopyTo);
+  AskAndDo(shell, Label("Copy"), LabelCount("Copy %1 file to", "Copy %1 files to", count),
+           &FileActions::CopyTo);
 }
 void MoveSelectionTo(Shell& shell) {
   const size_t count = shell.Tabs().SelectedPaths().size();
-  AskAndDo(shell, Label("Move"), LabelCount("Move %1 file to", "Move %1 files to", count), &FileActions::MoveTo);
+  AskAndDo(shell, Label("Move"), LabelCount("Move %1 file to", "Move %1 files to", count),
+           &FileActions::MoveTo);
 }
 
 }  // namespace fotomill::desktop

@@ -14,8 +14,8 @@ namespace fotomill::desktop {
 
 class Shell;
 
-// What the frame does to files: apart, one thing after the other, told of in the status bar, and kept so
-// that it can be taken back.
+// What the frame does to files: apart, one thing after the other, told of in the status bar, and
+// kept so that it can be taken back.
 class FileActions : public wxEvtHandler {
  public:
   explicit FileActions(Shell& shell);
@@ -23,8 +23,8 @@ class FileActions : public wxEvtHandler {
 
   // False when the user was asked and does not want it, where there is no trash.
   bool Trash(const std::vector<std::string>& paths);
-  // The same of a file that `view` shows; asks first if PromptDeleteFromView wants it. False when the answer was no, or
-  // other files are in progress.
+  // The same of a file that `view` shows; asks first if PromptDeleteFromView wants it. False when
+  // the answer was no, or other files are in progress.
   bool TrashFromView(wxWindow* view, const std::string& path);
   // Asks first. False when the answer was no.
   bool Delete(const std::vector<std::string>& paths);
@@ -36,7 +36,8 @@ class FileActions : public wxEvtHandler {
   // Several files at once, as the caller has planned it.
   void RenameAll(std::vector<FileStep> steps);
   void NewFolder(const std::string& parent);
-  // Turns the picture in a file; `then` is told whether that was done, with a remark. False when something else is being done.
+  // Turns the picture in a file; `then` is told whether that was done, with a remark. False when
+  // something else is being done.
   using Turned = std::function<void(bool done, const std::string& note)>;
   bool SaveTurned(const std::string& path, Orientation turn, Turned then);
 

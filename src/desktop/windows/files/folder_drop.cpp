@@ -24,8 +24,8 @@ DropKind KindNow() {
 
 // nullopt-like: 1 move, 0 copy, -1 neither.
 int AskKind(const std::string& folder) {
-  wxMessageDialog dialog(nullptr, Label("Move or copy the files to %1?", Shown(folder)), Label("Drop files"),
-                         wxYES_NO | wxCANCEL | wxICON_QUESTION);
+  wxMessageDialog dialog(nullptr, Label("Move or copy the files to %1?", Shown(folder)),
+                         Label("Drop files"), wxYES_NO | wxCANCEL | wxICON_QUESTION);
   dialog.SetYesNoLabels(Label("&Move"), Label("&Copy"));
   const int answer = dialog.ShowModal();
   return answer == wxID_YES ? 1 : answer == wxID_NO ? 0 : -1;

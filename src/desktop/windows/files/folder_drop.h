@@ -8,13 +8,16 @@
 
 namespace fotomill::desktop {
 
-// Files dropped on a window go to a folder: moved with Shift, copied with Ctrl, else as DropOptions says.
+// Files dropped on a window go to a folder: moved with Shift, copied with Ctrl, else as DropOptions
+// says.
 class FolderDrop : public wxFileDropTarget {
  public:
   // The folder at a place of the window, empty for none.
   using FolderAt = std::function<std::string(const wxPoint& place)>;
-  using Dropped = std::function<void(const std::vector<std::string>& files, const std::string& folder, bool move)>;
-  FolderDrop(FolderAt folderAt, Dropped dropped) : folderAt_(std::move(folderAt)), dropped_(std::move(dropped)) {}
+  using Dropped = std::function<void(const std::vector<std::string>& files,
+                                     const std::string& folder, bool move)>;
+  FolderDrop(FolderAt folderAt, Dropped dropped)
+      : folderAt_(std::move(folderAt)), dropped_(std::move(dropped)) {}
 
   wxDragResult OnDragOver(wxCoord x, wxCoord y, wxDragResult suggested) override;
   bool OnDropFiles(wxCoord x, wxCoord y, const wxArrayString& names) override;

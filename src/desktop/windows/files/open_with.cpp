@@ -16,7 +16,8 @@ namespace {
 void Open(Shell& shell, const platform::Program& program, const std::vector<std::string>& files) {
   const bool started = platform::OpenWith(program, files);
   LogEvent("open-with", program.name + (started ? "" : " failed"));
-  shell.Report(started ? Tr("%1 was started.", program.name) : Tr("%1 could not be started.", program.name));
+  shell.Report(started ? Tr("%1 was started.", program.name)
+                       : Tr("%1 could not be started.", program.name));
 }
 
 }  // namespace

@@ -55,7 +55,8 @@ struct FlagBox {
   KeyNumber key;
   const char* text;
 };
-enum Flag : size_t { kSkipColliding, kUpdate, kPrefix, kRandom, kHyphen };  // their places in the table
+// their places in the table
+enum Flag : size_t { kSkipColliding, kUpdate, kPrefix, kRandom, kHyphen };
 constexpr FlagBox kFlags[] = {
     {KeyNumber::SequentialRenameSkipCollide, TrLater("&Skip colliding files")},
     {KeyNumber::SequentialRenameUpdate, TrLater("&Update base number")},
@@ -66,14 +67,16 @@ constexpr FlagBox kFlags[] = {
 
 std::vector<BatchFile> BatchFiles(const std::vector<std::string>& files, size_t most) {
   std::vector<BatchFile> batch;
-  for (size_t i = 0; i < std::min(files.size(), most); ++i) batch.push_back({.name = files[i], .below = {}, .hint = {}});
+  for (size_t i = 0; i < std::min(files.size(), most); ++i)
+    batch.push_back({.name = files[i], .below = {}, .hint = {}});
   return batch;
 }
 
 class SequentialRenameDialog : public wxDialog {
  public:
   SequentialRenameDialog(wxWindow* parent, const std::vector<std::string>& files);
-  // The rules that the user chose, which the settings hold then; nullopt, and nothing is changed, when nothing is wanted.
+  // The rules that the user chose, which the settings hold then; nullopt, and nothing is changed,
+  // when nothing is wanted.
   std::optional<SequentialRenameRules> Ask();
 
  private:
@@ -91,9 +94,10 @@ class SequentialRenameDialog : public wxDialog {
   wxButton* ok_ = nullptr;
 };
 
-SequentialRenameDialog::SequentialRenameDialog(wxWindow* parent, const std::vector<std::string>& files)
-    : wxDialog(parent, wxID_ANY, Label("Sequential Rename"), wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
-               "SequentialRenameBox"),
+SequentialRenameDialog::SequentialRenameDialog(wxWindow* parent,
+                                               const std::vector<std::string>& files)
+    : wxDialog(parent, wxID_ANY, Label("Sequential Rename"), wxDefaultPosition, wxDefaultSize,
+               wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "SequentialRenameBox"),
       files_(files) {
   const int gap = FromDIP(8);
   auto* grid = new wxFlexGridSizer(2, gap, gap);
@@ -102,15 +106,17 @@ SequentialRenameDialog::SequentialRenameDialog(wxWindow* parent, const std::vect
     grid->Add(new wxStaticText(this, wxID_ANY, text), wxSizerFlags().CenterVertical());
   };
   label(Label("&Base name:"));
-  base_ = new wxComboBox(this, wxID_ANY, wxString::FromUTF8(settings.SequentialRenameBaseName.c_str()), wxDefaultPosition,
-                         FromDIP(wxSize(300, -1)), 0, nullptr, 0, wxDefaultValidator, Label("Base name"));
+  base_ =
+      new wxComboBox(this, wxID_ANY, wxString::FromUTF8(settings.SequentialRenameBaseName.c_str()),
+                     wxDefaultPosition, FromDIP(wxSize(300, -1)), 0, nullptr, 0, wxDefaultValidator,
+                     Label("Base name"));
   for (const std::string& entry : LoadHistoryList(HistoryList::RenameBases)) {
     if (entry != kDefaultEntry) base_->Append(wxString::FromUTF8(entry));
   }
   grid->Add(base_, wxSizerFlags(1).Expand());
   const auto spin = [&](const wxString& name, int least, int most, int value) {
-    auto* control =
-        new wxSpinCtrl(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxSP_ARROW_KEYS, least, most, value, name);
+    auto* control = new wxSpinCtrl(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize,
+                                   wxSP_ARROW_KEYS, least, most, value, name);
     grid->Add(control);
     control->Bind(wxEVT_SPINCTRL, [this](wxSpinEvent&) { UpdateControls(); });
     return control;
@@ -130,8 +136,9 @@ SequentialRenameDialog::SequentialRenameDialog(wxWindow* parent, const std::vect
     flags->Add(flags_[i], wxSizerFlags().Border(wxRIGHT | wxBOTTOM, gap));
   }
   sizer->Add(flags, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT, gap));
-  preview_ = new wxListCtrl(this, wxID_ANY, wxDefaultPosition, wxSize(TextWidth(*this, 520), FromDIP(220)),
-                            wxLC_REPORT | wxLC_SINGLE_SEL, wxDefaultValidator, Label("New names"));
+  preview_ =
+      new wxListCtrl(this, wxID_ANY, wxDefaultPosition, wxSize(TextWidth(*this, 520), FromDIP(220)),
+                     wxLC_REPORT | wxLC_SINGLE_SEL, wxDefaultValidator, Label("New names"));
   preview_->AppendColumn(Label("Old name"), wxLIST_FORMAT_LEFT, TextWidth(*this, 250));
   preview_->AppendColumn(Label("New name"), wxLIST_FORMAT_LEFT, TextWidth(*this, 250));
   sizer->Add(preview_, wxSizerFlags(1).Expand().Border(wxLEFT | wxRIGHT, gap));
@@ -166,7 +173,8 @@ SequentialRenameRules SequentialRenameDialog::ReadControls() const {
   rules.update = flags_[kUpdate]->GetValue();
   rules.numberFirst = flags_[kPrefix]->GetValue();
   rules.random = flags_[kRandom]->GetValue();
-  rules.separator = flags_[kHyphen]->GetValue() ? std::string(settings.SequentialRenameSep) : std::string();
+  rules.separator =
+      flags_[kHyphen]->GetValue() ? std::string(settings.SequentialRenameSep) : std::string();
   return rules;
 }
 
@@ -174,7 +182,8 @@ void SequentialRenameDialog::StoreControls() const {
   settings.SequentialRenameBaseName.AssignCut(Utf8(base_->GetValue()));
   settings.SequentialRenameBaseNumber = number_->GetValue();
   settings.SequentialRenameIncrement = increment_->GetValue();
-  for (size_t i = 0; i < std::size(kFlags); ++i) StoreNumber(KeyOf(kFlags[i].key), flags_[i]->GetValue() ? 1 : 0);
+  for (size_t i = 0; i < std::size(kFlags); ++i)
+    StoreNumber(KeyOf(kFlags[i].key), flags_[i]->GetValue() ? 1 : 0);
   (void)AddToHistoryList(HistoryList::RenameBases, settings.SequentialRenameBaseName);
   (void)SaveConfiguration();
 }
@@ -182,10 +191,12 @@ void SequentialRenameDialog::StoreControls() const {
 // The new names as a run would give them now; nothing is renamed.
 void SequentialRenameDialog::UpdateControls() {
   const std::string base = Utf8(base_->GetValue());
-  base_->Enable(!flags_[kPrefix]->GetValue());  // with the number in front every file keeps its own name behind it
+  // with the number in front every file keeps its own name behind it
+  base_->Enable(!flags_[kPrefix]->GetValue());
   const bool plain = IsPlainName(base) && !base.empty();
   ok_->Enable(plain || flags_[kPrefix]->GetValue());
-  if (!plain) return problem_->SetLabel(Label("The base name must be part of a file name, not a path."));
+  if (!plain)
+    return problem_->SetLabel(Label("The base name must be part of a file name, not a path."));
   PreviewBox box;
   BatchJob job;
   job.box = &box;
@@ -195,14 +206,18 @@ void SequentialRenameDialog::UpdateControls() {
   preview_->DeleteAllItems();
   size_t failed = 0;
   for (const FileOutcome& outcome : box.outcomes) {
-    const long row = preview_->InsertItem(preview_->GetItemCount(), Shown(platform::FileNameOf(outcome.source)));
+    const long row =
+        preview_->InsertItem(preview_->GetItemCount(), Shown(platform::FileNameOf(outcome.source)));
     const bool bad = outcome.status != Status::Ok || outcome.skipped;
     failed += bad ? 1 : 0;
-    preview_->SetItem(row, 1, bad ? Label("unchanged") : Shown(platform::FileNameOf(outcome.destination)));
+    preview_->SetItem(row, 1,
+                      bad ? Label("unchanged") : Shown(platform::FileNameOf(outcome.destination)));
     if (bad) preview_->SetItemTextColour(row, ToWx(CurrentPalette().fault));
   }
   preview_->Thaw();
-  problem_->SetLabel(failed == 0 ? wxString() : LabelCount("%1 of the files shown cannot be renamed.", "%1 of the files shown cannot be renamed.", failed));
+  problem_->SetLabel(failed == 0 ? wxString()
+                                 : LabelCount("%1 of the files shown cannot be renamed.",
+                                              "%1 of the files shown cannot be renamed.", failed));
 }
 
 std::optional<SequentialRenameRules> SequentialRenameDialog::Ask() {
@@ -214,7 +229,8 @@ std::optional<SequentialRenameRules> SequentialRenameDialog::Ask() {
 // What the last run renamed, for the frame's undo.
 void NoteRenames(Shell& shell) {
   FileOperation operation{FileOperationKind::Rename, {}};
-  for (const RenamedFile& file : ReadRenameLog().value_or(RenameHistory()).files) operation.steps.push_back({file.from, file.to});
+  for (const RenamedFile& file : ReadRenameLog().value_or(RenameHistory()).files)
+    operation.steps.push_back({file.from, file.to});
   shell.Files().NoteDone(std::move(operation));
 }
 
@@ -228,11 +244,12 @@ void RenameSelectionSequentially(Shell& shell) {
   const std::optional<SequentialRenameRules> rules = dialog.Ask();
   if (!rules) return;
   const RenameOptions options{.rules = *rules};
-  shell.Batches().Run(NewBatchJob(), [batch = BatchFiles(files, files.size()), options, &shell](BatchJob& running) {
-    RunRename(batch, options, running);
-    shell.Window().CallAfter([&shell] { NoteRenames(shell); });
-    return Status::Ok;
-  });
+  shell.Batches().Run(
+      NewBatchJob(), [batch = BatchFiles(files, files.size()), options, &shell](BatchJob& running) {
+        RunRename(batch, options, running);
+        shell.Window().CallAfter([&shell] { NoteRenames(shell); });
+        return Status::Ok;
+      });
 }
 
 }  // namespace fotomill::desktop

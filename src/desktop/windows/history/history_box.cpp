@@ -42,12 +42,14 @@ int ThumbnailSide() {
 
 class FileHistoryBox::Lines : public wxDataViewVirtualListModel {
  public:
-  Lines(const FileHistoryList& history, const HistoryThumbnails& thumbnails) : history_(history), thumbnails_(thumbnails) {}
+  Lines(const FileHistoryList& history, const HistoryThumbnails& thumbnails)
+      : history_(history), thumbnails_(thumbnails) {}
   void GetValueByRow(wxVariant& value, unsigned int row, unsigned int column) const override {
     if (row >= history_.Count()) {
       value = wxString();
     } else if (column == choice::kColumnName) {
-      value << wxDataViewIconText(Shown(history_.Cell(row, column)), thumbnails_.Find(history_.Row(row).path));
+      value << wxDataViewIconText(Shown(history_.Cell(row, column)),
+                                  thumbnails_.Find(history_.Row(row).path));
     } else {
       value = Shown(history_.Cell(row, column));
     }
@@ -65,12 +67,14 @@ FileHistoryBox::FileHistoryBox(Shell& shell)
       shell_(shell),
       thumbnails_([this](const std::vector<std::string>& paths) {
         for (size_t row = 0; row < history_.Count(); ++row) {
-          if (std::ranges::find(paths, history_.Row(row).path) != paths.end()) lines_->RowChanged(static_cast<unsigned>(row));
+          if (std::ranges::find(paths, history_.Row(row).path) != paths.end())
+            lines_->RowChanged(static_cast<unsigned>(row));
         }
       }),
       lines_(new Lines(history_, thumbnails_)) {
   const bool known = settings.FileHistoryWidth > 0 && settings.FileHistoryDepth > 0;
-  SetSize(FromDIP(known ? wxSize(settings.FileHistoryWidth, settings.FileHistoryDepth) : wxSize(1080, 560)));
+  SetSize(FromDIP(known ? wxSize(settings.FileHistoryWidth, settings.FileHistoryDepth)
+                        : wxSize(1080, 560)));
   count_ = new wxStaticText(this, wxID_ANY, wxEmptyString);
   auto* column = new wxBoxSizer(wxVERTICAL);
   BuildList();
@@ -94,7 +98,8 @@ FileHistoryBox::~FileHistoryBox() { KeepPlaces(); }
 
 void FileHistoryBox::BuildList() {
   const long rules = settings.FileHistoryListRuleEnable != 0 ? wxDV_HORIZ_RULES : 0;
-  list_ = new wxDataViewCtrl(this, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxDV_MULTIPLE | rules);
+  list_ =
+      new wxDataViewCtrl(this, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxDV_MULTIPLE | rules);
   list_->SetName(Label(kTitle));
   list_->AssociateModel(lines_.get());
   list_->Bind(wxEVT_DATAVIEW_ITEM_ACTIVATED, [this](wxDataViewEvent&) { ViewFile(); });
@@ -120,11 +125,14 @@ void FileHistoryBox::AddColumns() {
     const wxAlignment alignment = facts.number ? wxALIGN_RIGHT : wxALIGN_LEFT;
     const int middle = alignment | wxALIGN_CENTER_VERTICAL;
     const int width = std::max(NumberIn(KeyOf(facts.width)) * whole / kWholeWidth, FromDIP(30));
-    wxDataViewRenderer* renderer = i == choice::kColumnName ? static_cast<wxDataViewRenderer*>(new wxDataViewIconTextRenderer(
-                                                                  "wxDataViewIconText", wxDATAVIEW_CELL_INERT, middle))
-                                                            : new wxDataViewTextRenderer("string", wxDATAVIEW_CELL_INERT, middle);
+    wxDataViewRenderer* renderer =
+        i == choice::kColumnName
+            ? static_cast<wxDataViewRenderer*>(new wxDataViewIconTextRenderer(
+                  "wxDataViewIconText", wxDATAVIEW_CELL_INERT, middle))
+            : new wxDataViewTextRenderer("string", wxDATAVIEW_CELL_INERT, middle);
     list_->AppendColumn(
-        new wxDataViewColumn(Label(facts.title), renderer, i, width, alignment, wxDATAVIEW_COL_RESIZABLE | wxDATAVIEW_COL_REORDERABLE));
+        new wxDataViewColumn(Label(facts.title), renderer, i, width, alignment,
+                             wxDATAVIEW_COL_RESIZABLE | wxDATAVIEW_COL_REORDERABLE));
   }
 }
 
@@ -139,7 +147,8 @@ void FileHistoryBox::Refill() {
     list_->Select(lines_->GetItem(0));
   }
   UpdateControls();
-  LogEvent("history", "rows=" + std::to_string(history_.Count()) + " sort=" + std::to_string(history_.SortColumn()));
+  LogEvent("history", "rows=" + std::to_string(history_.Count()) +
+                          " sort=" + std::to_string(history_.SortColumn()));
 }
 
 void FileHistoryBox::UpdateControls() {
@@ -147,7 +156,8 @@ void FileHistoryBox::UpdateControls() {
   wxString text = settings.FileHistoryEnable == 0
                       ? Label("The file history is disabled; Options enables it.")
                       : LabelCount("%1 file", "%1 files", history_.Count());
-  if (settings.FileHistoryEnable != 0 && selected > 1) text += ", " + Label("%1 selected", selected);
+  if (settings.FileHistoryEnable != 0 && selected > 1)
+    text += ", " + Label("%1 selected", selected);
   if (!readable_) text = Label("The history file is not readable. Clear deletes it.");
   count_->SetLabel(text);
   for (const wxWindowID id : {wxID_OPEN, wxID_UP}) FindWindow(id)->Enable(selected == 1);
@@ -180,7 +190,8 @@ wxSizer* FileHistoryBox::BuildButtons() {
   };
   auto* row = new wxBoxSizer(wxHORIZONTAL);
   for (const Button& button : kButtons) {
-    row->Add(new wxButton(this, button.id, Label(button.label)), wxSizerFlags().Border(wxRIGHT, FromDIP(6)));
+    row->Add(new wxButton(this, button.id, Label(button.label)),
+             wxSizerFlags().Border(wxRIGHT, FromDIP(6)));
     Bind(
         wxEVT_BUTTON, [this, run = button.run](wxCommandEvent&) { (this->*run)(); }, button.id);
   }
@@ -194,7 +205,8 @@ void FileHistoryBox::ViewFile() {
   if (rows.size() != 1) return;
   const std::string path = history_.Row(rows.front()).path;
   if (!platform::IsRegularFile(path)) {
-    wxMessageBox(Label("The file no longer exists. Remove deletes its entry from the list."), Label(kTitle), wxOK | wxICON_INFORMATION, this);
+    wxMessageBox(Label("The file no longer exists. Remove deletes its entry from the list."),
+                 Label(kTitle), wxOK | wxICON_INFORMATION, this);
     return;
   }
   Shell& shell = shell_;
@@ -211,13 +223,15 @@ void FileHistoryBox::ShowFolder() {
   EndModal(wxID_OPEN);
   shell.Window().CallAfter([&shell, path, folder] {
     const std::string trimmed = folder.size() > 1 ? folder.substr(0, folder.size() - 1) : folder;
-    if (BrowserPage* browser = shell.Tabs().Open(trimmed)) browser->Open(trimmed, std::string(platform::FileNameOf(path)));
+    if (BrowserPage* browser = shell.Tabs().Open(trimmed))
+      browser->Open(trimmed, std::string(platform::FileNameOf(path)));
   });
 }
 
 bool FileHistoryBox::Confirm(const wxString& question, const wxString& verb) {
   if (settings.FileHistoryRemovePrompt == 0) return true;
-  wxRichMessageDialog dialog(this, question, Label("History entries"), wxYES_NO | wxNO_DEFAULT | wxICON_QUESTION);
+  wxRichMessageDialog dialog(this, question, Label("History entries"),
+                             wxYES_NO | wxNO_DEFAULT | wxICON_QUESTION);
   dialog.SetExtendedMessage(Label("The files themselves are not affected."));
   dialog.SetYesNoLabels("&" + verb, Label("&Keep"));
   dialog.ShowCheckBox(Label("Do not ask again (can be re-enabled in Setup)"));
@@ -233,18 +247,22 @@ bool FileHistoryBox::Confirm(const wxString& question, const wxString& verb) {
 void FileHistoryBox::RemoveSelected() {
   const std::vector<size_t> rows = SelectedRows();
   if (rows.empty()) return;
-  const wxString what = rows.size() == 1 ? "\"" + Shown(history_.Cell(rows.front(), choice::kColumnName)) + "\""
-                                         : LabelCount("%1 entry", "%1 entries", rows.size());
+  const wxString what = rows.size() == 1
+                            ? "\"" + Shown(history_.Cell(rows.front(), choice::kColumnName)) + "\""
+                            : LabelCount("%1 entry", "%1 entries", rows.size());
   if (!Confirm(Label("Remove %1 from the file history?", what), Label("Remove"))) return;
   if (!history_.Remove(rows))
-    wxMessageBox(Label("The history file could not be written. The entries were not removed."), Label(kTitle), wxOK | wxICON_WARNING, this);
+    wxMessageBox(Label("The history file could not be written. The entries were not removed."),
+                 Label(kTitle), wxOK | wxICON_WARNING, this);
   Refill();
 }
 
 void FileHistoryBox::ClearAll() {
   if (!Confirm(Label("Remove all entries from the file history?"), Label("Clear"))) return;
   readable_ = history_.Clear();
-  if (!readable_) wxMessageBox(Label("The history file could not be deleted."), Label(kTitle), wxOK | wxICON_WARNING, this);
+  if (!readable_)
+    wxMessageBox(Label("The history file could not be deleted."), Label(kTitle),
+                 wxOK | wxICON_WARNING, this);
   Refill();
 }
 
@@ -268,7 +286,8 @@ void FileHistoryBox::KeepPlaces() {
 }
 
 bool ShowFileHistorySetup(wxWindow* parent) {
-  return ShowSettingsBox(parent, Label("File history options"), "FileHistorySetupBox", ItemsOf(SetupPage::History));
+  return ShowSettingsBox(parent, Label("File history options"), "FileHistorySetupBox",
+                         ItemsOf(SetupPage::History));
 }
 
 }  // namespace fotomill::desktop

@@ -21,7 +21,8 @@ wxBitmapBundle OnSquare(const RgbImage& pixels, int side, double scale) {
   std::memset(square.GetAlpha(), 0, static_cast<size_t>(side) * static_cast<size_t>(side));
   const int left = (side - pixels.width) / 2, top = (side - pixels.height) / 2;
   for (int y = 0; y < pixels.height && pixels.width <= side && pixels.height <= side; ++y) {
-    const size_t place = static_cast<size_t>(top + y) * static_cast<size_t>(side) + static_cast<size_t>(left);
+    const size_t place =
+        static_cast<size_t>(top + y) * static_cast<size_t>(side) + static_cast<size_t>(left);
     std::memcpy(square.GetData() + 3 * place, pixels.Row(y), static_cast<size_t>(pixels.width) * 3);
     std::memset(square.GetAlpha() + place, 255, static_cast<size_t>(pixels.width));
   }
@@ -45,7 +46,8 @@ void HistoryThumbnails::Want(const std::vector<std::string>& paths, int side, do
     if (side == 0 || bitmaps_.contains(path) || !GetsThumbnail(path)) continue;
     const platform::FileFacts facts = platform::FactsOf(path);
     if (facts.kind != platform::FileKind::Regular) continue;
-    requests.push_back({path, facts.modified, facts.size, side, choice::kDiskBased, false, ThumbnailOptionsFromSettings()});
+    requests.push_back({path, facts.modified, facts.size, side, choice::kDiskBased, false,
+                        ThumbnailOptionsFromSettings()});
   }
   loader_.Want(std::move(requests));
 }
@@ -58,7 +60,9 @@ const wxBitmapBundle& HistoryThumbnails::Find(const std::string& path) const {
 void HistoryThumbnails::FetchResults() {
   std::vector<std::string> paths;
   for (const ThumbnailLoader::Result& result : loader_.FetchResults()) {
-    if (result.request.side != side_ || result.thumbnail == nullptr || result.thumbnail->pixels.Empty()) continue;
+    if (result.request.side != side_ || result.thumbnail == nullptr ||
+        result.thumbnail->pixels.Empty())
+      continue;
     bitmaps_[result.request.path] = OnSquare(result.thumbnail->pixels, side_, scale_);
     paths.push_back(result.request.path);
   }

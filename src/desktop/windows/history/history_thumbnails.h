@@ -12,7 +12,8 @@
 
 namespace fotomill::desktop {
 
-// Thumbnails of the file history's rows, made apart; each on a square of one size, so that rows keep their height.
+// Thumbnails of the file history's rows, made apart; each on a square of one size, so that rows
+// keep their height.
 class HistoryThumbnails : public wxEvtHandler {
  public:
   // `came` is called with the paths whose thumbnails are there now.

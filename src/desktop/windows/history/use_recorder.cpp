@@ -22,7 +22,8 @@ void UseRecorder::Note(const std::vector<FileUse>& uses) {
 }
 
 void UseRecorder::Flush() {
-  if (!uses_.empty()) (void)UpdateFileHistory(HistoryOptionsFromSettings(), std::exchange(uses_, {}));
+  if (!uses_.empty())
+    (void)UpdateFileHistory(HistoryOptionsFromSettings(), std::exchange(uses_, {}));
 }
 
 }  // namespace fotomill::desktop

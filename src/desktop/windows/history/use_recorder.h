@@ -8,7 +8,8 @@
 
 namespace fotomill::desktop {
 
-// Takes down which files were used and for what, and writes that to the file history when nothing else is to be done.
+// Takes down which files were used and for what, and writes that to the file history when nothing
+// else is to be done.
 class UseRecorder {
  public:
   UseRecorder();

@@ -24,13 +24,14 @@
 namespace fotomill::desktop {
 
 ExifFrame::ExifFrame(wxWindow* parent, const std::string& path)
-    : wxFrame(parent, wxID_ANY, "EXIF: " + Shown(platform::FileNameOf(path)), wxDefaultPosition, wxDefaultSize,
-              wxDEFAULT_FRAME_STYLE | wxFRAME_FLOAT_ON_PARENT, "ExifBox"),
+    : wxFrame(parent, wxID_ANY, "EXIF: " + Shown(platform::FileNameOf(path)), wxDefaultPosition,
+              wxDefaultSize, wxDEFAULT_FRAME_STYLE | wxFRAME_FLOAT_ON_PARENT, "ExifBox"),
       path_(path) {
   const int gap = FromDIP(10);
   auto* panel = new wxPanel(this);
   problem_ = new wxStaticText(panel, wxID_ANY, Label("Reading..."));
-  list_ = new wxDataViewListCtrl(panel, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxDV_SINGLE | wxDV_ROW_LINES);
+  list_ = new wxDataViewListCtrl(panel, wxID_ANY, wxDefaultPosition, wxDefaultSize,
+                                 wxDV_SINGLE | wxDV_ROW_LINES);
   list_->SetName(Label("EXIF values"));
   list_->AppendTextColumn(Label("Name"), wxDATAVIEW_CELL_INERT, TextWidth(*this, 270));
   list_->AppendTextColumn(Label("Value"), wxDATAVIEW_CELL_INERT, TextWidth(*this, 330));
@@ -53,22 +54,26 @@ ExifFrame::ExifFrame(wxWindow* parent, const std::string& path)
       {wxID_CLOSE, TrLater("C&lose"), [this] { Close(); }},
   };
   wxSizer* buttons = BuildButtonRow(*this, *panel, rows);
-  for (const RowButton& row : rows) FindWindow(row.id)->Enable(row.id == wxID_CLOSE);  // until the file is read
+  // until the file is read
+  for (const RowButton& row : rows) FindWindow(row.id)->Enable(row.id == wxID_CLOSE);
   auto* column = new wxBoxSizer(wxVERTICAL);
   column->Add(problem_, wxSizerFlags().Expand().Border(wxLEFT | wxTOP | wxRIGHT, gap));
   column->Add(middle, wxSizerFlags(1).Expand().Border(wxALL, gap));
   column->Add(buttons, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, gap));
   panel->SetSizer(column);
-  wxAcceleratorEntry keys[] = {{wxACCEL_CTRL, 'C', wxID_COPY},           {wxACCEL_CTRL | wxACCEL_SHIFT, 'C', wxID_SELECTALL},
-                               {wxACCEL_CTRL, 'S', wxID_SAVEAS},         {wxACCEL_CTRL, 'P', wxID_PRINT},
-                               {wxACCEL_NORMAL, WXK_ESCAPE, wxID_CLOSE}, {wxACCEL_CTRL, 'W', wxID_CLOSE}};
+  wxAcceleratorEntry keys[] = {
+      {wxACCEL_CTRL, 'C', wxID_COPY},           {wxACCEL_CTRL | wxACCEL_SHIFT, 'C', wxID_SELECTALL},
+      {wxACCEL_CTRL, 'S', wxID_SAVEAS},         {wxACCEL_CTRL, 'P', wxID_PRINT},
+      {wxACCEL_NORMAL, WXK_ESCAPE, wxID_CLOSE}, {wxACCEL_CTRL, 'W', wxID_CLOSE}};
   SetAcceleratorTable(wxAcceleratorTable(static_cast<int>(std::size(keys)), keys));
   SetSize(FromDIP(wxSize(880, 620)));
   CentreOnParent();
   list_->SetFocus();
   work_.Start(
       *this,
-      [this, options = ExifTextOptionsFromSettings()](const StopToken&) { report_ = ReadExifReport(path_, options); },
+      [this, options = ExifTextOptionsFromSettings()](const StopToken&) {
+        report_ = ReadExifReport(path_, options);
+      },
       [this](Status status) {
         if (status != Status::Ok) report_.problem = Tr(StatusMessage(status));
         Finished();
@@ -92,13 +97,17 @@ void ExifFrame::Finished() {
   if (!report_.thumbnailBytes.empty()) {
     const std::string size = report_.thumbnail.Empty()
                                  ? std::string(Tr("The thumbnail cannot be decoded"))
-                                 : std::to_string(report_.thumbnail.width) + " x " + std::to_string(report_.thumbnail.height);
-    thumbnailFacts_->SetLabel(wxString::FromUTF8(size + "\n" + TrCount("%1 byte", "%1 bytes", report_.thumbnailBytes.size())));
+                                 : std::to_string(report_.thumbnail.width) + " x " +
+                                       std::to_string(report_.thumbnail.height);
+    thumbnailFacts_->SetLabel(wxString::FromUTF8(
+        size + "\n" + TrCount("%1 byte", "%1 bytes", report_.thumbnailBytes.size())));
   }
-  for (const wxWindowID id : {wxID_COPY, wxID_SELECTALL, wxID_SAVEAS, wxID_PRINT}) FindWindow(id)->Enable(!report_.rows.empty());
+  for (const wxWindowID id : {wxID_COPY, wxID_SELECTALL, wxID_SAVEAS, wxID_PRINT})
+    FindWindow(id)->Enable(!report_.rows.empty());
   FindWindow(wxID_SAVE)->Enable(!report_.thumbnailBytes.empty());
   list_->GetParent()->Layout();
-  LogEvent("exif", "rows=" + std::to_string(report_.rows.size()) + " thumbnail=" + std::to_string(report_.thumbnail.width));
+  LogEvent("exif", "rows=" + std::to_string(report_.rows.size()) +
+                       " thumbnail=" + std::to_string(report_.thumbnail.width));
 }
 
 wxString ExifFrame::SelectedValue() const {
@@ -110,18 +119,22 @@ wxString ExifFrame::SelectedValue() const {
 
 void ExifFrame::SaveThumbnail() {
   const std::string name = std::string(platform::SplitPath(path_).base) + "_thumbnail.jpg";
-  wxFileDialog dialog(this, Label("Save thumbnail"), wxEmptyString, Shown(name), Label("JPEG files (*.jpg)|*.jpg"),
-                      wxFD_SAVE | wxFD_OVERWRITE_PROMPT);
+  wxFileDialog dialog(this, Label("Save thumbnail"), wxEmptyString, Shown(name),
+                      Label("JPEG files (*.jpg)|*.jpg"), wxFD_SAVE | wxFD_OVERWRITE_PROMPT);
   if (dialog.ShowModal() != wxID_OK) return;
   const std::string target = Utf8(dialog.GetPath());
   const platform::FileFacts own = platform::FactsOf(path_), other = platform::FactsOf(target);
-  const bool itself = other.kind == platform::FileKind::Regular && own.device == other.device && own.identity == other.identity;
-  const std::string_view bytes(reinterpret_cast<const char*>(report_.thumbnailBytes.data()), report_.thumbnailBytes.size());
+  const bool itself = other.kind == platform::FileKind::Regular && own.device == other.device &&
+                      own.identity == other.identity;
+  const std::string_view bytes(reinterpret_cast<const char*>(report_.thumbnailBytes.data()),
+                               report_.thumbnailBytes.size());
   if (itself) {
-    wxMessageBox(Label("This is the picture itself. Choose another name."), Label("Save thumbnail"), wxOK | wxICON_WARNING, this);
-  } else if (!platform::WriteWholeFile(target, bytes)) {
-    wxMessageBox(Label("\"%1\" could not be written. Choose another folder or name.", dialog.GetPath()), Label("Save thumbnail"),
+    wxMessageBox(Label("This is the picture itself. Choose another name."), Label("Save thumbnail"),
                  wxOK | wxICON_WARNING, this);
+  } else if (!platform::WriteWholeFile(target, bytes)) {
+    wxMessageBox(
+        Label("\"%1\" could not be written. Choose another folder or name.", dialog.GetPath()),
+        Label("Save thumbnail"), wxOK | wxICON_WARNING, this);
   }
 }
 

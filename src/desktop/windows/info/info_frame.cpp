@@ -32,8 +32,8 @@ constexpr int kProgressMs = 200;
 }  // namespace
 
 InfoFrame::InfoFrame(Shell& shell, wxWindow* parent, std::vector<std::string> paths)
-    : wxFrame(parent, wxID_ANY, TitleOf(paths), wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE | wxFRAME_FLOAT_ON_PARENT,
-              "InfoBox"),
+    : wxFrame(parent, wxID_ANY, TitleOf(paths), wxDefaultPosition, wxDefaultSize,
+              wxDEFAULT_FRAME_STYLE | wxFRAME_FLOAT_ON_PARENT, "InfoBox"),
       shell_(shell),
       paths_(std::move(paths)) {
   const int gap = FromDIP(10);
@@ -45,7 +45,8 @@ InfoFrame::InfoFrame(Shell& shell, wxWindow* parent, std::vector<std::string> pa
     tree_ = new ReportTree(panel);
     column->Add(tree_, wxSizerFlags(1).Expand().Border(wxALL, gap));
   } else {
-    auto* splitter = new wxSplitterWindow(panel, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxSP_LIVE_UPDATE | wxSP_NOBORDER);
+    auto* splitter = new wxSplitterWindow(panel, wxID_ANY, wxDefaultPosition, wxDefaultSize,
+                                          wxSP_LIVE_UPDATE | wxSP_NOBORDER);
     list_ = new wxListBox(splitter, wxID_ANY);
     list_->SetName(Label("Files"));
     tree_ = new ReportTree(splitter);
@@ -54,7 +55,8 @@ InfoFrame::InfoFrame(Shell& shell, wxWindow* parent, std::vector<std::string> pa
     column->Add(splitter, wxSizerFlags(1).Expand().Border(wxALL, gap));
     list_->Bind(wxEVT_LISTBOX, [this](wxCommandEvent&) { ShowChoice(); });
   }
-  column->Add(BuildButtons(*panel), wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, gap));
+  column->Add(BuildButtons(*panel),
+              wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, gap));
   panel->SetSizer(column);
   SetSize(FromDIP(paths_.size() == 1 ? wxSize(700, 560) : wxSize(900, 560)));
   CentreOnParent();
@@ -97,7 +99,8 @@ void InfoFrame::Finished() {
   timer_.Stop();
   std::vector<FileUse> uses;
   for (const FileInfo& file : files_) {
-    if (file.status == Status::Ok) uses.push_back({.path = file.path, .function = FileFunction::GetInfo});
+    if (file.status == Status::Ok)
+      uses.push_back({.path = file.path, .function = FileFunction::GetInfo});
   }
   shell_.Uses().Note(uses);
   if (list_ != nullptr) {
@@ -124,7 +127,8 @@ void InfoFrame::ShowChoice() {
 
 std::string InfoFrame::WholeText() const {
   const int line = list_ == nullptr ? 1 : list_->GetSelection();
-  if (timer_.IsRunning() || files_.empty() || line == wxNOT_FOUND) return {};  // files are still being read apart
+  // files are still being read apart
+  if (timer_.IsRunning() || files_.empty() || line == wxNOT_FOUND) return {};
   if (line > 0) return TextOf(files_[static_cast<size_t>(line) - 1]);
   std::string text = TextOf(summary_);
   for (const FileInfo& file : files_) text.append("\n").append(TextOf(file));

@@ -19,7 +19,8 @@ namespace fotomill::desktop {
 class Shell;
 class ReportTree;
 
-// "Get info": the facts of one file, or of several with their totals and differences. Files are read apart.
+// "Get info": the facts of one file, or of several with their totals and differences. Files are
+// read apart.
 class InfoFrame : public wxFrame {
  public:
   InfoFrame(Shell& shell, wxWindow* parent, std::vector<std::string> paths);

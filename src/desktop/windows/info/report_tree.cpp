@@ -5,7 +5,8 @@
 
 namespace fotomill::desktop {
 
-ReportTree::ReportTree(wxWindow* parent) : wxTreeListCtrl(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTL_SINGLE) {
+ReportTree::ReportTree(wxWindow* parent)
+    : wxTreeListCtrl(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTL_SINGLE) {
   SetName(Label("Facts"));
   AppendColumn(Label("Name"), TextWidth(*this, 260), wxALIGN_LEFT, wxCOL_RESIZABLE);
   AppendColumn(Label("Value"), TextWidth(*this, 360), wxALIGN_LEFT, wxCOL_RESIZABLE);
@@ -16,7 +17,8 @@ void ReportTree::Show(std::span<const InfoSection> sections) {
   for (const InfoSection& section : sections) {
     const wxTreeListItem head = AppendItem(GetRootItem(), Shown(section.title));
     for (const InfoLine& line : section.lines) {
-      const wxTreeListItem item = AppendItem(head, Shown(line.label.empty() ? line.value : line.label));
+      const wxTreeListItem item =
+          AppendItem(head, Shown(line.label.empty() ? line.value : line.label));
       if (!line.label.empty()) SetItemText(item, 1, Shown(line.value));
     }
     Expand(head);

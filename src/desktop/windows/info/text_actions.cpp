@@ -36,7 +36,8 @@ wxArrayString PrintedLines(const std::string& text) {
 
 class TextPrintout : public wxPrintout {
  public:
-  TextPrintout(const wxString& title, const std::string& text) : wxPrintout(title), title_(title), lines_(PrintedLines(text)) {}
+  TextPrintout(const wxString& title, const std::string& text)
+      : wxPrintout(title), title_(title), lines_(PrintedLines(text)) {}
 
   bool HasPage(int page) override { return page >= 1 && page <= Pages(); }
   void GetPageInfo(int* first, int* last, int* from, int* to) override {
@@ -60,7 +61,9 @@ class TextPrintout : public wxPrintout {
   }
 
  private:
-  int Pages() const { return std::max(1, (static_cast<int>(lines_.size()) + kLinesOfAPage - 1) / kLinesOfAPage); }
+  int Pages() const {
+    return std::max(1, (static_cast<int>(lines_.size()) + kLinesOfAPage - 1) / kLinesOfAPage);
+  }
 
   const wxString title_;
   const wxArrayString lines_;
@@ -75,12 +78,14 @@ void CopyText(const wxString& text) {
 }
 
 void SaveTextAs(wxWindow& parent, const wxString& name, const std::string& text) {
-  wxFileDialog dialog(&parent, Label("Save as text"), wxEmptyString, name, Label("Text files (*.txt)|*.txt|All files|*"),
+  wxFileDialog dialog(&parent, Label("Save as text"), wxEmptyString, name,
+                      Label("Text files (*.txt)|*.txt|All files|*"),
                       wxFD_SAVE | wxFD_OVERWRITE_PROMPT);
   if (dialog.ShowModal() != wxID_OK) return;
   if (platform::WriteWholeFile(Utf8(dialog.GetPath()), text)) return;
-  wxMessageBox(Label("\"%1\" could not be written. Choose another folder or name.", dialog.GetPath()), Label("Save as text"),
-               wxOK | wxICON_WARNING, &parent);
+  wxMessageBox(
+      Label("\"%1\" could not be written. Choose another folder or name.", dialog.GetPath()),
+      Label("Save as text"), wxOK | wxICON_WARNING, &parent);
 }
 
 void PrintText(wxWindow& parent, const wxString& title, const std::string& text) {

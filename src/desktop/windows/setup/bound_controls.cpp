@@ -60,12 +60,14 @@ std::string BoundControls::Text(uint32_t control) const {
   const auto* field = dynamic_cast<wxTextCtrl*>(window);
   if (field == nullptr) return {};
   const auto foreign = foreignTexts_.find(control);
-  const bool unchanged = foreign != foreignTexts_.end() && foreign->second.second == field->GetValue();
+  const bool unchanged =
+      foreign != foreignTexts_.end() && foreign->second.second == field->GetValue();
   return unchanged ? foreign->second.first : Utf8(field->GetValue());
 }
 
 void BoundControls::LimitText(uint32_t control, size_t bytes) {
-  if (auto* field = dynamic_cast<wxTextCtrl*>(Find(control))) field->SetMaxLength(static_cast<unsigned long>(bytes));
+  if (auto* field = dynamic_cast<wxTextCtrl*>(Find(control)))
+    field->SetMaxLength(static_cast<unsigned long>(bytes));
 }
 
 void BoundControls::SetRange(uint32_t control, const SpinRange& range) {
@@ -102,6 +104,8 @@ int32_t BoundControls::Selected(uint32_t control) const {
   return choice == nullptr ? -1 : choice->GetSelection();
 }
 
-std::vector<std::string> RegistryDestinations::Extensions() const { return fotomill::DestinationExtensions(); }
+std::vector<std::string> RegistryDestinations::Extensions() const {
+  return fotomill::DestinationExtensions();
+}
 
 }  // namespace fotomill::desktop

@@ -10,7 +10,8 @@
 
 namespace fotomill::desktop {
 
-// The controls below a window as the binding of settings sees them: the number of a control is its window's id.
+// The controls below a window as the binding of settings sees them: the number of a control is its
+// window's id.
 class BoundControls : public SetupDialog {
  public:
   explicit BoundControls(wxWindow& root) : root_(root) {}
@@ -33,7 +34,8 @@ class BoundControls : public SetupDialog {
 
  private:
   wxWindow& root_;
-  // Texts that are not UTF-8, as their bytes and as they are shown: one that nobody changed goes back byte for byte.
+  // Texts that are not UTF-8, as their bytes and as they are shown: one that nobody changed goes
+  // back byte for byte.
   std::unordered_map<uint32_t, std::pair<std::string, wxString>> foreignTexts_;
 };
 

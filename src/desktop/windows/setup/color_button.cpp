@@ -9,7 +9,9 @@ namespace fotomill::desktop {
 
 namespace {
 
-wxColour ColorOf(int32_t setting) { return wxColour(static_cast<unsigned long>(setting) & 0xFFFFFF); }
+wxColour ColorOf(int32_t setting) {
+  return wxColour(static_cast<unsigned long>(setting) & 0xFFFFFF);
+}
 int32_t SettingOf(const wxColour& color) { return static_cast<int32_t>(color.GetRGB()); }
 
 wxBitmap Swatch(const wxWindow& window, const wxColour& color) {

@@ -25,7 +25,8 @@ wxString WorksHere(const FormatEntry& row) {
 }  // namespace
 
 FormatList::FormatList(wxWindow* parent)
-    : wxDataViewListCtrl(parent, wxID_ANY, wxDefaultPosition, parent->FromDIP(wxSize(-1, 280)), wxDV_SINGLE | wxDV_ROW_LINES) {
+    : wxDataViewListCtrl(parent, wxID_ANY, wxDefaultPosition, parent->FromDIP(wxSize(-1, 280)),
+                         wxDV_SINGLE | wxDV_ROW_LINES) {
   SetName(Label("Formats"));
   AppendToggleColumn(Label("On"), wxDATAVIEW_CELL_ACTIVATABLE, FromDIP(50), wxALIGN_CENTER);
   AppendTextColumn(Label("Format"), wxDATAVIEW_CELL_INERT, TextWidth(*this, 300));
@@ -47,7 +48,8 @@ FormatList::FormatList(wxWindow* parent)
     SetToggleValue(!GetToggleValue(line, kOnColumn), line, kOnColumn);
     Turn(item);
   };
-  Bind(wxEVT_DATAVIEW_ITEM_ACTIVATED, [toggle](wxDataViewEvent& event) { toggle(event.GetItem()); });
+  Bind(wxEVT_DATAVIEW_ITEM_ACTIVATED,
+       [toggle](wxDataViewEvent& event) { toggle(event.GetItem()); });
   Bind(wxEVT_CHAR_HOOK, [this, toggle](wxKeyEvent& event) {
     if (event.GetKeyCode() == WXK_SPACE) return toggle(GetSelection());
     event.Skip();
@@ -63,8 +65,9 @@ void FormatList::Turn(const wxDataViewItem& item) {
   const SaveResult saved = SwitchFormat(index, on);
   LogEvent("formats", Utf8(GetTextValue(line, kFormatColumn)) + (on ? " on" : " off"));
   if (saved == SaveResult::Done || saved == SaveResult::Unchanged) return;
-  wxMessageBox(Shown(Tr(SaveMessage(saved))) + " " + Label("The change applies until the program exits."), Label("Formats"),
-               wxOK | wxICON_WARNING, wxGetTopLevelParent(this));
+  wxMessageBox(
+      Shown(Tr(SaveMessage(saved))) + " " + Label("The change applies until the program exits."),
+      Label("Formats"), wxOK | wxICON_WARNING, wxGetTopLevelParent(this));
 }
 
 }  // namespace fotomill::desktop

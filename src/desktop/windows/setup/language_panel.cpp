@@ -14,7 +14,8 @@ namespace fotomill::desktop {
 
 LanguagePanel::LanguagePanel(wxWindow* parent) : wxPanel(parent) {
   auto* row = new wxBoxSizer(wxHORIZONTAL);
-  row->Add(new wxStaticText(this, wxID_ANY, Label("&Language:")), wxSizerFlags().CenterVertical().Border(wxRIGHT, FromDIP(6)));
+  row->Add(new wxStaticText(this, wxID_ANY, Label("&Language:")),
+           wxSizerFlags().CenterVertical().Border(wxRIGHT, FromDIP(6)));
   choice_ = new wxChoice(this, wxID_ANY);
   choice_->SetName(Label("Language"));
   choice_->Append(Label("Language of the system"));
@@ -32,14 +33,17 @@ LanguagePanel::LanguagePanel(wxWindow* parent) : wxPanel(parent) {
   SetSizer(row);
 }
 
-std::string LanguagePanel::Chosen() const { return codes_[static_cast<size_t>(choice_->GetSelection())]; }
+std::string LanguagePanel::Chosen() const {
+  return codes_[static_cast<size_t>(choice_->GetSelection())];
+}
 
 void LanguagePanel::Store() {
   const std::string code = Chosen();
   if (code == StoredLanguage()) return;
   const bool stored = StoreLanguage(code);
   LogEvent("language", code.empty() ? "system" : code);
-  wxMessageBox(stored ? Label("The language changes at the next start of the program.") : Label("The language could not be saved."),
+  wxMessageBox(stored ? Label("The language changes at the next start of the program.")
+                      : Label("The language could not be saved."),
                Label("Setup"), wxOK | (stored ? wxICON_INFORMATION : wxICON_WARNING), this);
 }
 

@@ -14,7 +14,8 @@ class LanguagePanel : public wxPanel {
  public:
   explicit LanguagePanel(wxWindow* parent);
 
-  // Stores what is chosen. The first time it differs from before, a message says when it takes effect.
+  // Stores what is chosen. The first time it differs from before, a message says when it takes
+  // effect.
   void Store();
 
  private:

@@ -19,7 +19,8 @@ class MaskList : public wxCheckListBox {
   }
   int32_t Mask() const {
     uint32_t mask = static_cast<uint32_t>(mask_);
-    for (unsigned bit = 0; bit < GetCount(); ++bit) mask = IsChecked(bit) ? mask | 1u << bit : mask & ~(1u << bit);
+    for (unsigned bit = 0; bit < GetCount(); ++bit)
+      mask = IsChecked(bit) ? mask | 1u << bit : mask & ~(1u << bit);
     return static_cast<int32_t>(mask);
   }
 

@@ -12,17 +12,23 @@ namespace {
 
 // The operation `options` of the rows that have one; `parameter` is the row's index.
 int32_t RowOptions(void* parentWindow, int32_t parameter) {
-  return ShowOverrideBox(static_cast<wxWindow*>(parentWindow), FormatRow(parameter).extension.view()) ? 1 : 0;
+  return ShowOverrideBox(static_cast<wxWindow*>(parentWindow),
+                         FormatRow(parameter).extension.view())
+             ? 1
+             : 0;
 }
 
 }  // namespace
 
-bool HasOverrideBox(std::string_view extension) { return FindOverrideOptions(extension) != nullptr; }
+bool HasOverrideBox(std::string_view extension) {
+  return FindOverrideOptions(extension) != nullptr;
+}
 
 bool ShowOverrideBox(wxWindow* parent, std::string_view extension) {
   const FormatSettings* const options = FindOverrideOptions(extension);
   if (options == nullptr) return false;
-  return ShowSettingsBox(parent, Label("%1 options", options->extension), options->box, ItemsOf(*options));
+  return ShowSettingsBox(parent, Label("%1 options", options->extension), options->box,
+                         ItemsOf(*options));
 }
 
 bool ShiftOpensOverrideBox() { return settings.AllowDestinationOverrides != 0; }

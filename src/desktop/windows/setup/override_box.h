@@ -7,8 +7,8 @@
 
 namespace fotomill::desktop {
 
-// Whether a format, given by its extension, has options of its own, and the box that shows them: true when the user
-// confirmed.
+// Whether a format, given by its extension, has options of its own, and the box that shows them:
+// true when the user confirmed.
 bool HasOverrideBox(std::string_view extension);
 bool ShowOverrideBox(wxWindow* parent, std::string_view extension);
 // Whether Shift at the destination step opens the box.

@@ -24,14 +24,16 @@ namespace fotomill::desktop {
 
 namespace {
 
-constexpr int kLabelWidth = 330;  // device-independent pixels, so that controls of all groups stand in one line
+// device-independent pixels, so that controls of all groups stand in one line
+constexpr int kLabelWidth = 330;
 const wxString kMark = wxString::FromUTF8("\xE2\x97\x8F");
 
 enum Column { kMarkColumn, kLabelColumn, kControlColumn };
 
 wxArrayString FunctionNames() {
   wxArrayString names;
-  for (int32_t function = 0; function < kFileFunctionCount; ++function) names.Add(Shown(Tr(FileFunctionName(function))));
+  for (int32_t function = 0; function < kFileFunctionCount; ++function)
+    names.Add(Shown(Tr(FileFunctionName(function))));
   return names;
 }
 
@@ -44,11 +46,12 @@ wxString TipOf(const KeyRow& row) {
 
 wxWindow* MakeSpin(wxWindow* box, const KeyRow& row, wxWindowID id) {
   // The range stands where the binding looks for it.
-  auto* range = new wxStaticText(box, id + static_cast<int>(kSpinRangeControl), Shown(SpinRangeText(SpinRangeOf(row))));
+  auto* range = new wxStaticText(box, id + static_cast<int>(kSpinRangeControl),
+                                 Shown(SpinRangeText(SpinRangeOf(row))));
   range->Hide();
   const SpinRange limits = SpinRangeOf(row);
-  auto* spin =
-      new wxSpinCtrl(box, id, wxEmptyString, wxDefaultPosition, wxDefaultSize, wxSP_ARROW_KEYS, limits.minimum, limits.maximum);
+  auto* spin = new wxSpinCtrl(box, id, wxEmptyString, wxDefaultPosition, wxDefaultSize,
+                              wxSP_ARROW_KEYS, limits.minimum, limits.maximum);
   return spin;
 }
 
@@ -68,9 +71,11 @@ bool IsWide(const KeyRow& row) { return (row.type & (KEY_TEXT | KEY_CHOICE)) == 
 
 }  // namespace
 
-SettingsPanel::SettingsPanel(wxWindow* parent, std::vector<SetupItem> items, std::function<void()> changed,
+SettingsPanel::SettingsPanel(wxWindow* parent, std::vector<SetupItem> items,
+                             std::function<void()> changed,
                              const std::function<wxWindow*(wxWindow*)>& above)
-    : wxScrolledWindow(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxVSCROLL | wxTAB_TRAVERSAL),
+    : wxScrolledWindow(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize,
+                       wxVSCROLL | wxTAB_TRAVERSAL),
       items_(std::move(items)) {
   const int gap = FromDIP(8);
   auto* column = new wxBoxSizer(wxVERTICAL);
@@ -124,7 +129,8 @@ void SettingsPanel::AddItem(wxWindow* box, wxSizer* sizer, const SetupItem& item
   wxWindow* control = MakeControl(box, item);
   control->SetName(text);
   control->SetToolTip(TipOf(row));
-  grid->Add(mark, {line, kMarkColumn}, {1, 1}, wxALIGN_CENTER_VERTICAL | wxRESERVE_SPACE_EVEN_IF_HIDDEN);
+  grid->Add(mark, {line, kMarkColumn}, {1, 1},
+            wxALIGN_CENTER_VERTICAL | wxRESERVE_SPACE_EVEN_IF_HIDDEN);
   if (flag) {
     grid->Add(control, {line, kLabelColumn}, {1, 2}, wxALIGN_CENTER_VERTICAL);
     return;
@@ -157,8 +163,8 @@ void BindSettingsHelp(wxWindow& window) {
   window.Bind(wxEVT_CHAR_HOOK, [&window](wxKeyEvent& event) {
     if (event.GetKeyCode() != WXK_F1) return event.Skip();
     std::string_view page = kGeneralHelpPage;
-    for (const wxWindow* focus = wxWindow::FindFocus(); focus != nullptr && page == kGeneralHelpPage;
-         focus = focus->GetParent()) {
+    for (const wxWindow* focus = wxWindow::FindFocus();
+         focus != nullptr && page == kGeneralHelpPage; focus = focus->GetParent()) {
       if (focus->GetId() > 0) page = HelpPageFor(static_cast<uint32_t>(focus->GetId()));
     }
     ShowHelp(window, page);

@@ -13,11 +13,13 @@ class wxStaticText;
 
 namespace fotomill::desktop {
 
-// A page of settings: a box for each group, in it a labelled control for each key, and a mark before those that do not
-// show their default. It fills nothing: whoever made it binds its controls.
+// A page of settings: a box for each group, in it a labelled control for each key, and a mark
+// before those that do not show their default. It fills nothing: whoever made it binds its
+// controls.
 class SettingsPanel : public wxScrolledWindow {
  public:
-  // `changed` is called after the user changed a control. `above` is on top of the groups, if given.
+  // `changed` is called after the user changed a control. `above` is on top of the groups, if
+  // given.
   SettingsPanel(wxWindow* parent, std::vector<SetupItem> items, std::function<void()> changed,
                 const std::function<wxWindow*(wxWindow*)>& above = {});
 

@@ -38,13 +38,16 @@ constexpr const char* kTransferFiles = TrLater("Settings (*.ini)|*.ini|All files
 bool MayChangeSettings(wxWindow& window) {
   auto* const shell = dynamic_cast<Shell*>(wxTheApp->GetTopWindow());
   if (shell == nullptr || !shell->Batches().Running()) return true;
-  wxMessageBox(Label("A batch is running with the current settings. Change them when it has finished."), Label(kSetupTitle),
-               wxOK | wxICON_INFORMATION, &window);
+  wxMessageBox(
+      Label("A batch is running with the current settings. Change them when it has finished."),
+      Label(kSetupTitle), wxOK | wxICON_INFORMATION, &window);
   return false;
 }
 
-// Takes up what the controls hold and saves it. False after a message about the control that holds something else.
-bool ReadSettings(wxWindow& window, const BoundControls& controls, const std::function<void(uint32_t)>& show, bool& changed) {
+// Takes up what the controls hold and saves it. False after a message about the control that holds
+// something else.
+bool ReadSettings(wxWindow& window, const BoundControls& controls,
+                  const std::function<void(uint32_t)>& show, bool& changed) {
   const RegistryDestinations destinations;
   if (!MayChangeSettings(window)) return false;
   if (const auto fault = ReadSetupDialog(controls, destinations)) {
@@ -56,8 +59,8 @@ bool ReadSettings(wxWindow& window, const BoundControls& controls, const std::fu
   const SaveResult saved = SaveConfiguration();
   changed = saved != SaveResult::Unchanged;
   if (const std::string message = Tr(SaveMessage(saved)); !message.empty()) {
-    wxMessageBox(Shown(message) + " " + Label("The settings apply until the program exits."), Label(kSetupTitle), wxOK | wxICON_WARNING,
-                 &window);
+    wxMessageBox(Shown(message) + " " + Label("The settings apply until the program exits."),
+                 Label(kSetupTitle), wxOK | wxICON_WARNING, &window);
   }
   return true;
 }
@@ -65,13 +68,14 @@ bool ReadSettings(wxWindow& window, const BoundControls& controls, const std::fu
 }  // namespace
 
 SetupBox::SetupBox(wxWindow* parent, std::function<void()> applied, SetupPage first)
-    : wxDialog(parent, wxID_ANY, Label(kSetupTitle), wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER,
-               "SetupBox"),
+    : wxDialog(parent, wxID_ANY, Label(kSetupTitle), wxDefaultPosition, wxDefaultSize,
+               wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "SetupBox"),
       applied_(std::move(applied)),
       controls_(*this),
       page_(first) {
   const int gap = FromDIP(10);
-  search_ = new wxSearchCtrl(this, wxID_ANY, wxEmptyString, wxDefaultPosition, FromDIP(wxSize(230, -1)));
+  search_ =
+      new wxSearchCtrl(this, wxID_ANY, wxEmptyString, wxDefaultPosition, FromDIP(wxSize(230, -1)));
   search_->SetDescriptiveText(Label("Search settings"));
   search_->ShowCancelButton(true);
   search_->SetName(Label("Search settings"));
@@ -131,7 +135,9 @@ void SetupBox::BuildPages() {
       above = [](wxWindow* parent) -> wxWindow* { return new FormatList(parent); };
     }
     if (static_cast<SetupPage>(page) == SetupPage::Browsing) {
-      above = [this](wxWindow* parent) -> wxWindow* { return language_ = new LanguagePanel(parent); };
+      above = [this](wxWindow* parent) -> wxWindow* {
+        return language_ = new LanguagePanel(parent);
+      };
     }
     auto* panel = new SettingsPanel(
         book_, ItemsOf(static_cast<SetupPage>(page)), [this] { ControlChanged(); }, above);
@@ -150,7 +156,8 @@ void SetupBox::ShowPages() {
   if (searching_) {
     for (const SetupItem& item : found_) lines.Add(Label(item.group) + ": " + Label(item.label));
   } else {
-    for (size_t page = 0; page < kSetupPageCount; ++page) lines.Add(Label(TitleOf(static_cast<SetupPage>(page))));
+    for (size_t page = 0; page < kSetupPageCount; ++page)
+      lines.Add(Label(TitleOf(static_cast<SetupPage>(page))));
   }
   list_->Set(lines);
   if (searching_ && !found_.empty()) {
@@ -169,7 +176,8 @@ void SetupBox::ChooseLine(bool focus) {
   wxWindow* const control = controls_.Find(KeyOf(item.key).control);
   if (control == nullptr) return;
   SettingsPanel& panel = Panel();
-  const wxPoint place = panel.CalcUnscrolledPosition(panel.ScreenToClient(control->GetScreenPosition()));
+  const wxPoint place =
+      panel.CalcUnscrolledPosition(panel.ScreenToClient(control->GetScreenPosition()));
   int unused = 0, step = 1;
   panel.GetScrollPixelsPerUnit(&unused, &step);
   panel.Scroll(-1, std::max(place.y - FromDIP(60), 0) / std::max(step, 1));
@@ -181,7 +189,8 @@ void SetupBox::ShowPage(SetupPage page) {
   book_->SetSelection(static_cast<size_t>(page));
   title_->SetLabel(Label(TitleOf(page)));
   if (!searching_) list_->SetSelection(static_cast<int>(page));
-  LogEvent("setup", std::string("page=") + TitleOf(page) + " found=" + std::to_string(found_.size()));
+  LogEvent("setup",
+           std::string("page=") + TitleOf(page) + " found=" + std::to_string(found_.size()));
 }
 
 void SetupBox::ControlChanged() {
@@ -250,7 +259,8 @@ void SetupBox::ResetPage() {
 
 void SetupBox::Import() {
   if (!MayChangeSettings(*this)) return;
-  wxFileDialog dialog(this, Label("Import settings"), wxEmptyString, wxEmptyString, Label(kTransferFiles), wxFD_OPEN | wxFD_FILE_MUST_EXIST);
+  wxFileDialog dialog(this, Label("Import settings"), wxEmptyString, wxEmptyString,
+                      Label(kTransferFiles), wxFD_OPEN | wxFD_FILE_MUST_EXIST);
   if (dialog.ShowModal() != wxID_OK) return;
   const Transfer transfer = ImportConfiguration(Utf8(dialog.GetPath()));
   FillSetupDialog(controls_, destinations_);
@@ -260,8 +270,8 @@ void SetupBox::Import() {
 }
 
 void SetupBox::Export() {
-  wxFileDialog dialog(this, Label("Export settings"), wxEmptyString, "Fotomill settings.ini", Label(kTransferFiles),
-                      wxFD_SAVE | wxFD_OVERWRITE_PROMPT);
+  wxFileDialog dialog(this, Label("Export settings"), wxEmptyString, "Fotomill settings.ini",
+                      Label(kTransferFiles), wxFD_SAVE | wxFD_OVERWRITE_PROMPT);
   if (dialog.ShowModal() != wxID_OK) return;
   const Transfer transfer = ExportConfiguration(Utf8(dialog.GetPath()));
   Report(transfer.ok, transfer.message);
@@ -269,20 +279,24 @@ void SetupBox::Export() {
 
 void SetupBox::OpenDataFolder() {
   const std::string& folder = DataFolder();
-  if (folder.empty() || !platform::MakeFolders(folder)) return Report(false, Tr("There is no data folder, and it could not be created."));
+  if (folder.empty() || !platform::MakeFolders(folder))
+    return Report(false, Tr("There is no data folder, and it could not be created."));
   if (!wxLaunchDefaultApplication(wxString::FromUTF8(folder))) {
     Report(false, Tr("No program was found to open the folder \"%1\".", folder));
   }
 }
 
 void SetupBox::Report(bool ok, const std::string& message) {
-  wxMessageBox(Shown(message), Label(kSetupTitle), wxOK | (ok ? wxICON_INFORMATION : wxICON_WARNING), this);
+  wxMessageBox(Shown(message), Label(kSetupTitle),
+               wxOK | (ok ? wxICON_INFORMATION : wxICON_WARNING), this);
 }
 
 // --- a few settings ---
 
-bool ShowSettingsBox(wxWindow* parent, const wxString& title, const wxString& name, const std::vector<SetupItem>& items) {
-  wxDialog dialog(parent, wxID_ANY, title, wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, name);
+bool ShowSettingsBox(wxWindow* parent, const wxString& title, const wxString& name,
+                     const std::vector<SetupItem>& items) {
+  wxDialog dialog(parent, wxID_ANY, title, wxDefaultPosition, wxDefaultSize,
+                  wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, name);
   BoundControls controls(dialog);
   const RegistryDestinations destinations;
   SettingsPanel* panel = nullptr;

@@ -15,7 +15,8 @@ class wxStaticText;
 
 namespace fotomill::desktop {
 
-// All settings: pages at the left, a search field over all of them above, the controls of one page at the right.
+// All settings: pages at the left, a search field over all of them above, the controls of one page
+// at the right.
 class SetupBox : public wxDialog {
  public:
   // `applied` is called whenever settings have changed and were saved.
@@ -50,8 +51,9 @@ class SetupBox : public wxDialog {
   wxSimplebook* book_ = nullptr;
 };
 
-// A box of a few settings with OK and Cancel: the options of a format, of the file history. True when the user confirmed;
-// the settings are saved then.
-bool ShowSettingsBox(wxWindow* parent, const wxString& title, const wxString& name, const std::vector<SetupItem>& items);
+// A box of a few settings with OK and Cancel: the options of a format, of the file history. True
+// when the user confirmed; the settings are saved then.
+bool ShowSettingsBox(wxWindow* parent, const wxString& title, const wxString& name,
+                     const std::vector<SetupItem>& items);
 
 }  // namespace fotomill::desktop

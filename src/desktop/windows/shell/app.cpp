@@ -62,7 +62,8 @@ class App : public wxApp {
   void OnInitCmdLine(wxCmdLineParser& parser) override {
     parser.SetSwitchChars("-");
     parser.AddSwitch("h", "help", Label("show this help"), wxCMD_LINE_OPTION_HELP);
-    parser.AddLongSwitch(kNewInstance, Label("open a new window even if the program is already running"));
+    parser.AddLongSwitch(kNewInstance,
+                         Label("open a new window even if the program is already running"));
     parser.AddParam("FOLDER or FILE", wxCMD_LINE_VAL_STRING, wxCMD_LINE_PARAM_OPTIONAL);
   }
   bool OnCmdLineParsed(wxCmdLineParser& parser) override {
@@ -105,7 +106,8 @@ class App : public wxApp {
 
   // The log is told which window has the keyboard.
   int FilterEvent(wxEvent& event) override {
-    if (EventLogOn() && event.GetEventType() == wxEVT_ACTIVATE && static_cast<wxActivateEvent&>(event).GetActive()) {
+    if (EventLogOn() && event.GetEventType() == wxEVT_ACTIVATE &&
+        static_cast<wxActivateEvent&>(event).GetActive()) {
       const auto* window = dynamic_cast<wxTopLevelWindow*>(event.GetEventObject());
       if (window != nullptr) LogEvent("active", Utf8(window->GetTitle()));
     }

@@ -24,16 +24,20 @@ constexpr int kViewsMs = 2000;  // after the last change
 
 }  // namespace
 
-wxString FolderLabel(const std::string& folder) { return folder == "/" ? wxString("/") : Shown(platform::FileNameOf(folder)); }
+wxString FolderLabel(const std::string& folder) {
+  return folder == "/" ? wxString("/") : Shown(platform::FileNameOf(folder));
+}
 
-BrowserTabs::BrowserTabs(wxWindow* parent, Shell& shell, FrameMenus& menus, std::function<void()> changed)
+BrowserTabs::BrowserTabs(wxWindow* parent, Shell& shell, FrameMenus& menus,
+                         std::function<void()> changed)
     : shell_(shell), menus_(menus), changed_(std::move(changed)) {
   views_.Load();
   closed_.Load();
   viewsTimer_.Bind(wxEVT_TIMER, [this](wxTimerEvent&) { (void)views_.Save(); });
   book_ = new wxAuiNotebook(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize,
-                            wxAUI_NB_TOP | wxAUI_NB_TAB_MOVE | wxAUI_NB_SCROLL_BUTTONS | wxAUI_NB_CLOSE_ON_ALL_TABS |
-                                wxAUI_NB_MIDDLE_CLICK_CLOSE | wxBORDER_NONE);
+                            wxAUI_NB_TOP | wxAUI_NB_TAB_MOVE | wxAUI_NB_SCROLL_BUTTONS |
+                                wxAUI_NB_CLOSE_ON_ALL_TABS | wxAUI_NB_MIDDLE_CLICK_CLOSE |
+                                wxBORDER_NONE);
   book_->SetArtProvider(new wxAuiGenericTabArt);
   book_->Bind(wxEVT_AUINOTEBOOK_PAGE_CHANGED, &BrowserTabs::OnTabChanged, this);
   book_->Bind(wxEVT_AUINOTEBOOK_PAGE_CLOSE, [this](wxAuiNotebookEvent& event) {
@@ -46,7 +50,9 @@ wxWindow& BrowserTabs::Window() const { return *book_; }
 
 // --- the browser in front ---
 
-BrowserPage* BrowserTabs::PageAt(size_t tab) const { return static_cast<BrowserPage*>(book_->GetPage(tab)); }
+BrowserPage* BrowserTabs::PageAt(size_t tab) const {
+  return static_cast<BrowserPage*>(book_->GetPage(tab));
+}
 
 BrowserPage* BrowserTabs::Front() const {
   const int tab = book_->GetSelection();
@@ -85,7 +91,8 @@ void BrowserTabs::SelectFiles(const std::vector<std::string>& files) {
 // --- tabs ---
 
 BrowserPage* BrowserTabs::Open(const std::string& folder) {
-  FolderView view{{settings.DefaultThumbnailMode, settings.DefaultViewMode, settings.DefaultSortMode}};
+  FolderView view{
+      {settings.DefaultThumbnailMode, settings.DefaultViewMode, settings.DefaultSortMode}};
   if (const BrowserPage* browser = Front()) view = browser->Model().View();
   auto* page = new BrowserPage(book_, *this, shell_.Thumbnails(), view);
   book_->AddPage(page, FolderLabel(folder), true);
@@ -119,12 +126,14 @@ void BrowserTabs::Reopen() {
 
 void BrowserTabs::Step(int step) {
   const int count = static_cast<int>(book_->GetPageCount());
-  if (count > 1) book_->SetSelection(static_cast<size_t>((book_->GetSelection() + step + count) % count));
+  if (count > 1)
+    book_->SetSelection(static_cast<size_t>((book_->GetSelection() + step + count) % count));
 }
 
 void BrowserTabs::OnTabChanged(wxAuiNotebookEvent& event) {
   const int left = event.GetOldSelection();
-  if (left != wxNOT_FOUND && static_cast<size_t>(left) < book_->GetPageCount()) PageAt(static_cast<size_t>(left))->KeepColumns();
+  if (left != wxNOT_FOUND && static_cast<size_t>(left) < book_->GetPageCount())
+    PageAt(static_cast<size_t>(left))->KeepColumns();
   for (wxWindow* const window : book_->GetChildren()) {
     if (dynamic_cast<wxAuiTabCtrl*>(window) != nullptr) window->SetName(Label("Tabs"));
   }
@@ -213,9 +222,12 @@ void BrowserTabs::ShowContextMenu(wxWindow& window, const wxPoint& place, bool o
   if (onFile) menus_.ShowContextMenu(window, place);
 }
 
-void BrowserTabs::RenameFile(const std::string& path, const std::string& name) { shell_.Files().Rename(path, name); }
+void BrowserTabs::RenameFile(const std::string& path, const std::string& name) {
+  shell_.Files().Rename(path, name);
+}
 
-void BrowserTabs::DropFiles(const std::vector<std::string>& files, const std::string& folder, bool move) {
+void BrowserTabs::DropFiles(const std::vector<std::string>& files, const std::string& folder,
+                            bool move) {
   shell_.Files().Drop(files, folder, move);
 }
 

@@ -21,17 +21,20 @@ namespace fotomill::desktop {
 class FrameMenus;
 class Shell;
 
-// The browsers of the frame, a tab each, and what they share: the columns of the details and how folders are shown.
+// The browsers of the frame, a tab each, and what they share: the columns of the details and how
+// folders are shown.
 class BrowserTabs : private BrowserHost {
  public:
-  // `changed` is called when the browser in front has another folder, selection, mode or count, or is another one.
+  // `changed` is called when the browser in front has another folder, selection, mode or count, or
+  // is another one.
   BrowserTabs(wxWindow* parent, Shell& shell, FrameMenus& menus, std::function<void()> changed);
 
   wxWindow& Window() const;
 
   // The browser in front; there is always one once a folder was opened.
   BrowserPage* Front() const;
-  // What functions work on: files selected in the browser in front, in list order, or else the focused one.
+  // What functions work on: files selected in the browser in front, in list order, or else the
+  // focused one.
   std::vector<std::string> SelectedFiles() const;
   // The same with folders.
   std::vector<std::string> SelectedPaths() const;
@@ -70,7 +73,8 @@ class BrowserTabs : private BrowserHost {
   void ViewFile(const std::string& path) override;
   void ShowContextMenu(wxWindow& window, const wxPoint& place, bool onFile) override;
   void RenameFile(const std::string& path, const std::string& name) override;
-  void DropFiles(const std::vector<std::string>& files, const std::string& folder, bool move) override;
+  void DropFiles(const std::vector<std::string>& files, const std::string& folder,
+                 bool move) override;
 
   BrowserPage* PageAt(size_t tab) const;
   void OnTabChanged(wxAuiNotebookEvent& event);

@@ -62,7 +62,8 @@ void Select(Shell& shell) {
 
 void SelectByPattern(Shell& shell) {
   BrowserPage* browser = shell.Tabs().Front();
-  if (browser != nullptr && AskAndSelect(shell.Window(), browser->Model())) browser->SelectionChanged();
+  if (browser != nullptr && AskAndSelect(shell.Window(), browser->Model()))
+    browser->SelectionChanged();
 }
 
 void SelectSameType(Shell& shell) {
@@ -98,7 +99,9 @@ void ChooseToolbar(Shell& shell) { shell.Toolbar().Choose(); }
 void Quit(Shell& shell) { shell.Window().Close(); }
 void ToggleFolders(Shell& shell) { shell.Folders().Show(!shell.Folders().Shown()); }
 void ReadFoldersAgain(Shell& shell) { shell.FilesChanged(); }
-void ToggleFavourite(Shell& shell) { shell.Folders().ToggleFavourite(shell.Tabs().CurrentFolder()); }
+void ToggleFavourite(Shell& shell) {
+  shell.Folders().ToggleFavourite(shell.Tabs().CurrentFolder());
+}
 bool IsFavourite(Shell& shell) { return shell.Folders().IsFavourite(shell.Tabs().CurrentFolder()); }
 void Larger(Shell& shell) {
   if (BrowserPage* browser = shell.Tabs().Front()) browser->ChangeSize(1);
@@ -217,13 +220,17 @@ std::span<const Command> Commands() { return kCommands; }
 
 const Command& CommandOfId(int id) { return kCommands[id - kFirstCommandId]; }
 
-bool IsCommandId(int id) { return id >= kFirstCommandId && id < kFirstCommandId + static_cast<int>(std::size(kCommands)); }
+bool IsCommandId(int id) {
+  return id >= kFirstCommandId && id < kFirstCommandId + static_cast<int>(std::size(kCommands));
+}
 
 bool CanRun(const Command& command, Shell& shell) {
   const BrowserPage* browser = shell.Tabs().Front();
   switch (command.needs) {
     case Needs::Files: return browser != nullptr && browser->Model().HasFileForFunction();
-    case Needs::Few: return browser != nullptr && CompareFrame::CanShow(browser->Model().Selected().SelectedCount());
+    case Needs::Few:
+      return browser != nullptr &&
+             CompareFrame::CanShow(browser->Model().Selected().SelectedCount());
     case Needs::Item: return browser != nullptr && browser->Model().HasPathForFunction();
     case Needs::ClosedTab: return shell.Tabs().HasClosed();
     case Needs::Undo: return shell.Files().Undoable().CanUndo() && !shell.Files().Busy();
@@ -247,7 +254,9 @@ const char* WhyNot(Needs needs) {
 }
 
 const Command* CommandOfSymbol(std::string_view symbol) {
-  const auto has = [symbol](const Command& command) { return command.symbol != nullptr && command.symbol == symbol; };
+  const auto has = [symbol](const Command& command) {
+    return command.symbol != nullptr && command.symbol == symbol;
+  };
   const auto* const found = std::ranges::find_if(kCommands, has);
   return found == std::end(kCommands) ? nullptr : found;
 }

@@ -20,8 +20,9 @@ enum class Needs {
   ClosedTab,
 };
 
-// One function of the frame: a menu item, perhaps a button, its keys, and what it does. A new window is one row in
-// commands.cpp. Menus and toolbar are in the order of the rows; a row without text draws a line in its menu.
+// One function of the frame: a menu item, perhaps a button, its keys, and what it does. A new
+// window is one row in commands.cpp. Menus and toolbar are in the order of the rows; a row without
+// text draws a line in its menu.
 struct Command {
   const char* menu;              // "&File"; these texts are in English
   const char* text;              // with mnemonic; null for a separator
@@ -29,9 +30,11 @@ struct Command {
   const char* help = "";         // one sentence for the status bar
   Needs needs = Needs::Nothing;
   void (*run)(Shell& shell) = nullptr;
-  const char* symbol = nullptr;             // of the button in the toolbar (bitmaps.cpp), null for no button
+  // of the button in the toolbar (bitmaps.cpp), null for no button
+  const char* symbol = nullptr;
   bool inContextMenu = false;               // of a file in a browser
-  bool (*checked)(Shell& shell) = nullptr;  // whether its menu item has a mark; null for one that never has
+  // whether its menu item has a mark; null for one that never has
+  bool (*checked)(Shell& shell) = nullptr;
   const char* secondKey = nullptr;          // that does the same
 };
 
@@ -41,7 +44,9 @@ const Command* CommandOfSymbol(std::string_view symbol);
 
 // The id of a row's menu item and button.
 inline constexpr int kFirstCommandId = wxID_HIGHEST + 100;
-inline int CommandId(const Command& command) { return kFirstCommandId + static_cast<int>(&command - Commands().data()); }
+inline int CommandId(const Command& command) {
+  return kFirstCommandId + static_cast<int>(&command - Commands().data());
+}
 bool IsCommandId(int id);  // false for identifiers of the toolkit
 // The command of such an id.
 const Command& CommandOfId(int id);

@@ -24,7 +24,8 @@ constexpr int kUsualWidth = 230, kLeastShown = 160, kLeastWidth = 120;  // devic
 
 FolderPane::FolderPane(Shell& shell) : shell_(shell) {
   favourites_.Load();
-  splitter_ = new wxSplitterWindow(&shell.Window(), wxID_ANY, wxDefaultPosition, wxDefaultSize, wxSP_LIVE_UPDATE | wxSP_NOBORDER);
+  splitter_ = new wxSplitterWindow(&shell.Window(), wxID_ANY, wxDefaultPosition, wxDefaultSize,
+                                   wxSP_LIVE_UPDATE | wxSP_NOBORDER);
   splitter_->SetMinimumPaneSize(splitter_->FromDIP(kLeastWidth));
   FolderTree::Events events;
   events.chosen = [this](const std::string& folder) {
@@ -32,20 +33,23 @@ FolderPane::FolderPane(Shell& shell) : shell_(shell) {
   };
   events.openInTab = [this](const std::string& folder) { shell_.Tabs().Open(folder); };
   events.newFolder = [this](const std::string& folder) { shell_.Files().NewFolder(folder); };
-  events.rename = [this](const std::string& folder, const std::string& name) { shell_.Files().Rename(folder, name); };
+  events.rename = [this](const std::string& folder, const std::string& name) {
+    shell_.Files().Rename(folder, name);
+  };
   events.toggleFavourite = [this](const std::string& folder) { ToggleFavourite(folder); };
   tree_ = new FolderTree(splitter_, favourites_, events);
-  tree_->SetDropTarget(new FolderDrop([this](const wxPoint& place) { return tree_->FolderAt(place); },
-                                      [this](const std::vector<std::string>& files, const std::string& folder, bool move) {
-                                        shell_.Files().Drop(files, folder, move);
-                                      }));
+  tree_->SetDropTarget(
+      new FolderDrop([this](const wxPoint& place) { return tree_->FolderAt(place); },
+                     [this](const std::vector<std::string>& files, const std::string& folder,
+                            bool move) { shell_.Files().Drop(files, folder, move); }));
 }
 
 wxWindow* FolderPane::Parent() const { return splitter_; }
 
 void FolderPane::PlaceBeside(wxWindow& other) {
   other_ = &other;
-  const int width = settings.RememberNavPaneHPosition > 0 ? settings.RememberNavPaneHPosition : kUsualWidth;
+  const int width =
+      settings.RememberNavPaneHPosition > 0 ? settings.RememberNavPaneHPosition : kUsualWidth;
   splitter_->SplitVertically(tree_, other_, splitter_->FromDIP(width));
 }
 
@@ -55,7 +59,9 @@ void FolderPane::Show(bool show) {
   if (show == Shown()) return;
   if (show) {
     tree_->Show();
-    splitter_->SplitVertically(tree_, other_, splitter_->FromDIP(std::max(settings.RememberNavPaneHPosition, kLeastShown)));
+    splitter_->SplitVertically(
+        tree_, other_,
+        splitter_->FromDIP(std::max(settings.RememberNavPaneHPosition, kLeastShown)));
   } else {
     KeepWidth();
     splitter_->Unsplit(tree_);
@@ -80,7 +86,8 @@ void FolderPane::FollowRename(const std::string& from, const std::string& to) {
 }
 
 void FolderPane::ToggleFavourite(const std::string& folder) {
-  const bool written = favourites_.Has(folder) ? favourites_.Remove(folder) : favourites_.Add(folder);
+  const bool written =
+      favourites_.Has(folder) ? favourites_.Remove(folder) : favourites_.Add(folder);
   if (!written) shell_.Report(Tr("The list of favorites could not be saved."));
   tree_->UpdatePlaces();
   LogEvent("favourites", std::to_string(favourites_.Folders().size()));

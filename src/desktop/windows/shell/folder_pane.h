@@ -12,7 +12,8 @@ namespace fotomill::desktop {
 class FolderTree;
 class Shell;
 
-// The left side of the frame: the folder tree with the favourites at its top, which can be hidden and resized.
+// The left side of the frame: the folder tree with the favourites at its top, which can be hidden
+// and resized.
 class FolderPane {
  public:
   explicit FolderPane(Shell& shell);

@@ -20,7 +20,8 @@ namespace {
 
 // With its key, as menus show it and take it.
 wxString MenuText(const Command& command) {
-  const wxString keys = *command.accelerator == '\0' ? wxString() : wxString("\t") + command.accelerator;
+  const wxString keys =
+      *command.accelerator == '\0' ? wxString() : wxString("\t") + command.accelerator;
   return Label(command.text) + keys;
 }
 
@@ -42,7 +43,8 @@ void FrameMenus::BuildBar() {
       menu->AppendSeparator();
       continue;
     }
-    menu->Append(CommandId(command), MenuText(command), Label(command.help), command.checked != nullptr ? wxITEM_CHECK : wxITEM_NORMAL);
+    menu->Append(CommandId(command), MenuText(command), Label(command.help),
+                 command.checked != nullptr ? wxITEM_CHECK : wxITEM_NORMAL);
   }
   shell_.Window().SetMenuBar(bar);
 }
@@ -51,9 +53,11 @@ void FrameMenus::BindSecondKeys() {
   std::vector<wxAcceleratorEntry> keys;
   for (const Command& command : Commands()) {
     wxAcceleratorEntry key(0, 0, CommandId(command));
-    if (command.secondKey != nullptr && key.FromString(wxString("\t") + command.secondKey)) keys.push_back(key);
+    if (command.secondKey != nullptr && key.FromString(wxString("\t") + command.secondKey))
+      keys.push_back(key);
   }
-  shell_.Window().SetAcceleratorTable(wxAcceleratorTable(static_cast<int>(keys.size()), keys.data()));
+  shell_.Window().SetAcceleratorTable(
+      wxAcceleratorTable(static_cast<int>(keys.size()), keys.data()));
 }
 
 void FrameMenus::BindCommands() {
@@ -77,7 +81,8 @@ void FrameMenus::Update(wxUpdateUIEvent& event) {
   const UndoList& undo = shell_.Files().Undoable();
   const std::string name = command.needs == Needs::Undo ? undo.UndoName() : undo.RedoName();
   const wxString verb = Label(command.text);
-  const wxString text = (name.empty() ? verb : Label("%1 %2", verb, Shown(name))) + "\t" + command.accelerator;
+  const wxString text =
+      (name.empty() ? verb : Label("%1 %2", verb, Shown(name))) + "\t" + command.accelerator;
   wxMenuBar* const bar = shell_.Window().GetMenuBar();
   if (event.GetEventObject() == bar || bar->FindItem(event.GetId())->GetItemLabel() != text) {
     bar->FindItem(event.GetId())->SetItemLabel(text);

@@ -22,7 +22,8 @@ void FrameSession::RestorePlace() {
   const Session session = LoadSession();
   wxFrame& frame = shell_.Window();
   if (session.width > 0 && session.height > 0)
-    frame.SetSize(frame.FromDIP(wxSize(std::max(session.width, 400), std::max(session.height, 300))));
+    frame.SetSize(
+        frame.FromDIP(wxSize(std::max(session.width, 400), std::max(session.height, 300))));
   if (session.maximized) frame.Maximize();
   shell_.Tabs().SetColumns(session.columns);
   if (settings.RememberOpenWindows != 0) lastTabs_ = session;
@@ -61,10 +62,12 @@ bool FrameSession::Keep(bool withTabs) {
 void FrameSession::SaveTabSet() {
   const auto name = AskForTabSetName(shell_.Window());
   if (!name) return;
-  const SettingText before = std::exchange(settings.TabsetCurrentName, SettingText(TabSetFile(*name)));
+  const SettingText before =
+      std::exchange(settings.TabsetCurrentName, SettingText(TabSetFile(*name)));
   if (!Keep(true)) {
     settings.TabsetCurrentName = before;
-    wxMessageBox(Label("The tab set could not be written."), "Fotomill Professional", wxOK | wxICON_WARNING, &shell_.Window());
+    wxMessageBox(Label("The tab set could not be written."), "Fotomill Professional",
+                 wxOK | wxICON_WARNING, &shell_.Window());
     return;
   }
   (void)SaveConfiguration();
@@ -75,8 +78,10 @@ void FrameSession::SaveTabSet() {
 void FrameSession::OpenTabSet() {
   const auto name = ChooseTabSet(shell_.Window());
   if (!name || *name == CurrentTabSet()) return;
-  if (!Keep(true)) return shell_.Report(Tr("The open tabs could not be saved, so they were left open."));
-  const SettingText before = std::exchange(settings.TabsetCurrentName, SettingText(TabSetFile(*name)));
+  if (!Keep(true))
+    return shell_.Report(Tr("The open tabs could not be saved, so they were left open."));
+  const SettingText before =
+      std::exchange(settings.TabsetCurrentName, SettingText(TabSetFile(*name)));
   const Session session = LoadSession();
   if (session.tabs.empty()) {
     settings.TabsetCurrentName = before;

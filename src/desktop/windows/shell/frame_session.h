@@ -6,7 +6,8 @@ namespace fotomill::desktop {
 
 class Shell;
 
-// What comes back at the next start: the frame's size and its tabs. Tabs can also be kept as sets with names of their own.
+// What comes back at the next start: the frame's size and its tabs. Tabs can also be kept as sets
+// with names of their own.
 class FrameSession {
  public:
   explicit FrameSession(Shell& shell) : shell_(shell) {}
@@ -15,7 +16,8 @@ class FrameSession {
   void RestorePlace();
   // Opens the tabs of the last run, where they are to be remembered. False if there are none.
   bool RestoreTabs();
-  // Writes the tabs, or none, and the frame's size to the set in use. False when that could not be done.
+  // Writes the tabs, or none, and the frame's size to the set in use. False when that could not be
+  // done.
   [[nodiscard]] bool Keep(bool withTabs);
 
   // Ask for a name; the tabs are kept under it from then on.

@@ -16,7 +16,8 @@ namespace fotomill::desktop {
 
 FunctionToolbar::FunctionToolbar(Shell& shell)
     : shell_(shell),
-      bar_(shell.Window().CreateToolBar(wxTB_FLAT | wxTB_HORIZONTAL | wxTB_TEXT | wxTB_NODIVIDER, wxID_ANY, "Functions")) {
+      bar_(shell.Window().CreateToolBar(wxTB_FLAT | wxTB_HORIZONTAL | wxTB_TEXT | wxTB_NODIVIDER,
+                                        wxID_ANY, "Functions")) {
   Fill();
   // The tips follow; whether the button can be used is left to the frame.
   bar_->Bind(wxEVT_UPDATE_UI, [this](wxUpdateUIEvent& event) {
@@ -52,10 +53,13 @@ void FunctionToolbar::Choose() {
 
 // The tip of a button that is gray says why.
 void FunctionToolbar::ShowTip(const Command& command) {
-  const wxString key = *command.accelerator == '\0' ? wxString() : wxString(" (") + command.accelerator + ")";
-  const wxString why = CanRun(command, shell_) ? wxString() : wxString("\n") + Label(WhyNot(command.needs));
+  const wxString key =
+      *command.accelerator == '\0' ? wxString() : wxString(" (") + command.accelerator + ")";
+  const wxString why =
+      CanRun(command, shell_) ? wxString() : wxString("\n") + Label(WhyNot(command.needs));
   const wxString tip = Label(command.help) + key + why;
-  if (bar_->GetToolShortHelp(CommandId(command)) != tip) bar_->SetToolShortHelp(CommandId(command), tip);
+  if (bar_->GetToolShortHelp(CommandId(command)) != tip)
+    bar_->SetToolShortHelp(CommandId(command), tip);
 }
 
 }  // namespace fotomill::desktop

@@ -29,13 +29,15 @@ enum StatusField { kCountField, kMessageField, kFieldCount };
 }  // namespace
 
 MainFrame::MainFrame()
-    : wxFrame(nullptr, wxID_ANY, kTitle, wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE, "FotomillProfessional") {
+    : wxFrame(nullptr, wxID_ANY, kTitle, wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE,
+              "FotomillProfessional") {
   SetSize(FromDIP(wxSize(1180, 760)));
   uses_ = std::make_unique<UseRecorder>();
   menus_ = std::make_unique<FrameMenus>(*this);
   toolbar_ = std::make_unique<FunctionToolbar>(*this);
   folders_ = std::make_unique<FolderPane>(*this);
-  tabs_ = std::make_unique<BrowserTabs>(folders_->Parent(), *this, *menus_, [this] { BrowserChanged(); });
+  tabs_ = std::make_unique<BrowserTabs>(folders_->Parent(), *this, *menus_,
+                                        [this] { BrowserChanged(); });
   folders_->PlaceBeside(tabs_->Window());
   session_ = std::make_unique<FrameSession>(*this);
   pictures_ = std::make_unique<PictureWindows>(*this);
@@ -71,8 +73,9 @@ void MainFrame::ShowStartFolder(std::string folder, bool restore) {
 
 void MainFrame::OpenStart(const std::string& path, bool restore) {
   if (path.empty() || platform::IsFolder(path)) return ShowStartFolder(path, restore);
-  pictures_->ViewBeforeFolder(
-      path, [this, restore, folder = platform::AbsolutePath(path + "/..")] { ShowStartFolder(folder, restore); });
+  pictures_->ViewBeforeFolder(path, [this, restore, folder = platform::AbsolutePath(path + "/..")] {
+    ShowStartFolder(folder, restore);
+  });
 }
 
 void MainFrame::BrowserChanged() {
@@ -106,7 +109,8 @@ void MainFrame::Report(const std::string& text) { SetStatusText(Shown(text), kMe
 
 void MainFrame::OnClose(wxCloseEvent& event) {
   if (batches_->Running() && event.CanVeto()) {
-    wxMessageDialog dialog(this, Label("A batch is running. Stop it and quit?"), kTitle, wxOK | wxCANCEL | wxICON_WARNING);
+    wxMessageDialog dialog(this, Label("A batch is running. Stop it and quit?"), kTitle,
+                           wxOK | wxCANCEL | wxICON_WARNING);
     dialog.SetOKCancelLabels(Label("&Stop and quit"), Label("&Continue"));
     if (dialog.ShowModal() != wxID_OK) return event.Veto();
   }

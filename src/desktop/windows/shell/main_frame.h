@@ -18,8 +18,9 @@ class MainFrame : public wxFrame, public Shell {
   MainFrame();
   ~MainFrame() override;
 
-  // What the program was started with, a folder or a file: shows it. A file is shown at once and its folder listed
-  // afterwards; the tabs of the last time are opened with it when `restore`. Nothing: the tabs of the last time or a folder.
+  // What the program was started with, a folder or a file: shows it. A file is shown at once and
+  // its folder listed afterwards; the tabs of the last time are opened with it when `restore`.
+  // Nothing: the tabs of the last time or a folder.
   void OpenStart(const std::string& path, bool restore);
 
   // Shell

@@ -18,12 +18,15 @@ class PictureWindows {
  public:
   explicit PictureWindows(Shell& shell) : shell_(shell) {}
 
-  // Opens a view window on a file, with the files of `list` as its neighbors. It deletes itself when it is closed.
+  // Opens a view window on a file, with the files of `list` as its neighbors. It deletes itself
+  // when it is closed.
   ViewFrame& View(const std::vector<std::string>& list, const std::string& file);
-  // Opens one on a file of the browser in front: among the selected files if there are several, else among all shown.
+  // Opens one on a file of the browser in front: among the selected files if there are several,
+  // else among all shown.
   void ViewFromBrowser(const std::string& path);
-  // Opens one on a file whose folder is not listed yet. `showFolder` is called once the picture is on the screen; the keyboard
-  // stays with the picture, whose neighbors come with the list of that folder.
+  // Opens one on a file whose folder is not listed yet. `showFolder` is called once the picture is
+  // on the screen; the keyboard stays with the picture, whose neighbors come with the list of that
+  // folder.
   void ViewBeforeFolder(const std::string& path, std::function<void()> showFolder);
   // The browser in front has changed; a window may have waited for its list.
   void OfferList(const BrowserPage& browser);

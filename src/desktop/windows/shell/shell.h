@@ -16,8 +16,9 @@ class PictureWindows;
 class ThumbnailService;
 class UseRecorder;
 
-// What commands, dialogs and windows may ask of the program's window. Its parts have a header each; who needs one includes
-// that. All of them live as long as the window, which outlives the windows and dialogs opened on it.
+// What commands, dialogs and windows may ask of the program's window. Its parts have a header each;
+// who needs one includes that. All of them live as long as the window, which outlives the windows
+// and dialogs opened on it.
 class Shell {
  public:
   virtual ~Shell() = default;
@@ -37,7 +38,8 @@ class Shell {
 
   // Files were written, renamed or deleted: every window looks again.
   virtual void FilesChanged() = 0;
-  // A file or folder may have got another name: what shows it, or is in it, continues under that one.
+  // A file or folder may have got another name: what shows it, or is in it, continues under that
+  // one.
   virtual void FollowRename(const std::string& from, const std::string& to) = 0;
   // Settings have changed: every window shows what they say now.
   virtual void SettingsChanged() = 0;

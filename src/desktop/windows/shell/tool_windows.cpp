@@ -34,7 +34,9 @@ void ShowFileHistory(Shell& shell) {
   FileHistoryBox(shell).ShowModal();
   LogEvent("history", "closed");
 }
-void ShowCompaction(Shell& shell) { CompactionBox(&shell.Window(), shell.Tabs().CurrentFolder()).ShowModal(); }
+void ShowCompaction(Shell& shell) {
+  CompactionBox(&shell.Window(), shell.Tabs().CurrentFolder()).ShowModal();
+}
 void ShowCleanUp(Shell& shell) {
   CleanUpBox(&shell.Window(), shell.Tabs().CurrentFolder()).ShowModal();
   LogEvent("cleanup", "closed");

@@ -19,8 +19,8 @@ constexpr int kLineHeight = 4;
 
 AnimationBar::AnimationBar(wxWindow* parent, Events events) : wxPanel(parent) {
   auto* column = new wxBoxSizer(wxVERTICAL);
-  line_ = new wxGauge(this, wxID_ANY, 1, wxDefaultPosition, FromDIP(wxSize(-1, kLineHeight)), wxGA_HORIZONTAL | wxGA_SMOOTH,
-                      wxDefaultValidator, Label("Frame"));
+  line_ = new wxGauge(this, wxID_ANY, 1, wxDefaultPosition, FromDIP(wxSize(-1, kLineHeight)),
+                      wxGA_HORIZONTAL | wxGA_SMOOTH, wxDefaultValidator, Label("Frame"));
   buttons_ = new wxPanel(this);
   auto* row = new wxBoxSizer(wxHORIZONTAL);
   row->AddStretchSpacer();
@@ -35,8 +35,10 @@ AnimationBar::AnimationBar(wxWindow* parent, Events events) : wxPanel(parent) {
   Show(false);
 }
 
-wxBitmapButton* AnimationBar::AddButton(wxSizer& row, const char* symbol, const wxString& name, std::function<void()> action) {
-  auto* button = new wxBitmapButton(buttons_, wxID_ANY, Symbol(symbol), wxDefaultPosition, wxDefaultSize, wxBU_EXACTFIT);
+wxBitmapButton* AnimationBar::AddButton(wxSizer& row, const char* symbol, const wxString& name,
+                                        std::function<void()> action) {
+  auto* button = new wxBitmapButton(buttons_, wxID_ANY, Symbol(symbol), wxDefaultPosition,
+                                    wxDefaultSize, wxBU_EXACTFIT);
   button->SetToolTip(name);
   button->Bind(wxEVT_BUTTON, [action = std::move(action)](wxCommandEvent&) { action(); });
   row.Add(button, wxSizerFlags().Border(wxLEFT | wxRIGHT, FromDIP(2)));

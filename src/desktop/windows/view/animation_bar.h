@@ -8,8 +8,9 @@
 
 namespace fotomill::desktop {
 
-// What stands below an animation: a line that tells how far it is, with AnimationViewModeProgressBar, and buttons, with
-// AnimationViewModeToolbar. Hidden until there is something to tell.
+// What stands below an animation: a line that tells how far it is, with
+// AnimationViewModeProgressBar, and buttons, with AnimationViewModeToolbar. Hidden until there is
+// something to tell.
 class AnimationBar : public wxPanel {
  public:
   // What its buttons do.
@@ -26,7 +27,8 @@ class AnimationBar : public wxPanel {
   void Report(bool playing, size_t frame, size_t count);
 
  private:
-  wxBitmapButton* AddButton(wxSizer& row, const char* symbol, const wxString& name, std::function<void()> action);
+  wxBitmapButton* AddButton(wxSizer& row, const char* symbol, const wxString& name,
+                            std::function<void()> action);
 
   wxGauge* line_ = nullptr;
   wxPanel* buttons_ = nullptr;

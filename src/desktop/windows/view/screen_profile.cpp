@@ -10,7 +10,8 @@ constexpr char kProperty[] = "_ICC_PROFILE";  // "ICC Profiles in X", version 0.
 constexpr size_t kLargestProfile = 8 << 20;
 constexpr int kByteFormat = 8;  // bits of a value
 
-// wxWidgets has no words for properties of the root window; the few functions are those of the libraries that it has loaded.
+// wxWidgets has no words for properties of the root window; the few functions are those of the
+// libraries that it has loaded.
 class Gdk {
  public:
   Gdk() {
@@ -28,8 +29,9 @@ class Gdk {
   }
 
   bool OnX11() const {
-    const bool whole = display_ != nullptr && x11Display_ != nullptr && isA_ != nullptr && root_ != nullptr && atom_ != nullptr &&
-                       property_ != nullptr && free_ != nullptr;
+    const bool whole = display_ != nullptr && x11Display_ != nullptr && isA_ != nullptr &&
+                       root_ != nullptr && atom_ != nullptr && property_ != nullptr &&
+                       free_ != nullptr;
     void* const display = whole ? display_() : nullptr;
     return display != nullptr && isA_(display, x11Display_()) != 0;
   }
@@ -38,15 +40,18 @@ class Gdk {
     int format = 0, length = 0;
     uint8_t* data = nullptr;
     std::vector<uint8_t> bytes;
-    if (property_(root_(), atom_(name, 0), nullptr, 0, kLargestProfile, 0, nullptr, &format, &length, &data) == 0) return bytes;
+    if (property_(root_(), atom_(name, 0), nullptr, 0, kLargestProfile, 0, nullptr, &format,
+                  &length, &data) == 0)
+      return bytes;
     if (format == kByteFormat && data != nullptr && length > 0) bytes.assign(data, data + length);
     free_(data);
     return bytes;
   }
 
  private:
-  using GetProperty = int(void* window, void* property, void* type, unsigned long offset, unsigned long length, int remove,
-                          void** actualType, int* format, int* count, uint8_t** data);
+  using GetProperty = int(void* window, void* property, void* type, unsigned long offset,
+                          unsigned long length, int remove, void** actualType, int* format,
+                          int* count, uint8_t** data);
 
   platform::SharedLibrary gdk_, objects_, glib_;
   void* (*display_)() = nullptr;

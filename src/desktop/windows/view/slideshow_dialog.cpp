@@ -14,19 +14,22 @@
 namespace fotomill::desktop {
 
 std::optional<SlideshowChoices> AskForSlideshow(wxWindow& parent, const SlideshowChoices& choices) {
-  wxDialog dialog(&parent, wxID_ANY, Label("Slideshow"), wxDefaultPosition, wxDefaultSize, wxDEFAULT_DIALOG_STYLE, "SlideshowBox");
+  wxDialog dialog(&parent, wxID_ANY, Label("Slideshow"), wxDefaultPosition, wxDefaultSize,
+                  wxDEFAULT_DIALOG_STYLE, "SlideshowBox");
   const int gap = dialog.FromDIP(10);
   auto* grid = new wxFlexGridSizer(2, gap, gap);
   const auto label = [&](const wxString& text) {
     grid->Add(new wxStaticText(&dialog, wxID_ANY, text), wxSizerFlags().CenterVertical());
   };
   label(Label("&Seconds per picture:"));
-  auto* seconds = new wxSpinCtrl(&dialog, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxSP_ARROW_KEYS, 1,
-                                 SlideshowChoices::kMostSeconds, choices.seconds);
+  auto* seconds =
+      new wxSpinCtrl(&dialog, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxSP_ARROW_KEYS, 1,
+                     SlideshowChoices::kMostSeconds, choices.seconds);
   grid->Add(seconds);
   label(Label("&Order:"));
   const wxString orders[] = {Label("as listed"), Label("random")};
-  auto* order = new wxChoice(&dialog, wxID_ANY, wxDefaultPosition, wxDefaultSize, static_cast<int>(std::size(orders)), orders);
+  auto* order = new wxChoice(&dialog, wxID_ANY, wxDefaultPosition, wxDefaultSize,
+                             static_cast<int>(std::size(orders)), orders);
   order->SetSelection(choices.random ? 1 : 0);
   grid->Add(order);
   auto* repeat = new wxCheckBox(&dialog, wxID_ANY, Label("&Repeat from the start"));

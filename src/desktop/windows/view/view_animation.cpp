@@ -20,8 +20,8 @@ namespace {
 constexpr uint64_t kFrameBytes = 256ull * 1024 * 1024;  // of frames that are kept
 
 bool IsAnimation(const ViewPicturePointer& picture) {
-  return picture->picture != nullptr && picture->picture->pageCount > 1 && picture->request.page == 0 &&
-         FormatRow(picture->picture->formatIndex).animate != nullptr;
+  return picture->picture != nullptr && picture->picture->pageCount > 1 &&
+         picture->request.page == 0 && FormatRow(picture->picture->formatIndex).animate != nullptr;
 }
 
 }  // namespace
@@ -46,12 +46,13 @@ void ViewAnimation::Begin(const ViewPicturePointer& picture) {
   request.fitWidth = canvas_.DeviceSize().x;
   request.fitHeight = canvas_.DeviceSize().y;
   alive_ = std::make_shared<std::atomic<bool>>(true);
-  player_ = std::make_unique<AnimationPlayer>(std::move(request), kFrameBytes, [this, alive = alive_] {
-    if (!*alive) return;
-    wxTheApp->CallAfter([this, alive] {
-      if (*alive) Tick();
-    });
-  });
+  player_ =
+      std::make_unique<AnimationPlayer>(std::move(request), kFrameBytes, [this, alive = alive_] {
+        if (!*alive) return;
+        wxTheApp->CallAfter([this, alive] {
+          if (*alive) Tick();
+        });
+      });
   if (SystemAnimates()) player_->Play();
   bar_.Report(player_->Playing(), 0, static_cast<size_t>(picture->picture->pageCount));
 }

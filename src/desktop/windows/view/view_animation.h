@@ -14,13 +14,16 @@ namespace fotomill::desktop {
 
 class AnimationPlayer;
 
-// The animation in a view window: its frames come onto the canvas at their time, with the bar below it.
+// The animation in a view window: its frames come onto the canvas at their time, with the bar below
+// it.
 class ViewAnimation {
  public:
   // What its window does for it.
   struct Events {
-    std::function<void()> changed;  // another frame is on the canvas, or the animation plays or pauses
-    std::function<ViewPicturePointer(const ViewPicturePointer&)> dressed;  // a frame as it is to be shown; null if it cannot be
+    // another frame is on the canvas, or the animation plays or pauses
+    std::function<void()> changed;
+    // a frame as it is to be shown; null if it cannot be
+    std::function<ViewPicturePointer(const ViewPicturePointer&)> dressed;
   };
 
   ViewAnimation(ViewCanvas& canvas, AnimationBar& bar, Events events);
@@ -28,8 +31,8 @@ class ViewAnimation {
   ViewAnimation(const ViewAnimation&) = delete;
   ViewAnimation& operator=(const ViewAnimation&) = delete;
 
-  // Begins with a picture that has come onto the canvas, if it is an animation; it plays at once unless the system's
-  // animations are off. The bar comes and goes with it.
+  // Begins with a picture that has come onto the canvas, if it is an animation; it plays at once
+  // unless the system's animations are off. The bar comes and goes with it.
   void Begin(const ViewPicturePointer& picture);
   // Another picture is awaited.
   void End();
@@ -59,7 +62,8 @@ class ViewAnimation {
   bool hideBar_ = false;
   std::unique_ptr<AnimationPlayer> player_;
   ViewPicturePointer shown_;                  // the player's frame, null before the first one
-  std::shared_ptr<std::atomic<bool>> alive_;  // whether the player's thread may still tell something
+  // whether the player's thread may still tell something
+  std::shared_ptr<std::atomic<bool>> alive_;
 };
 
 }  // namespace fotomill::desktop

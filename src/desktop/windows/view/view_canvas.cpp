@@ -28,14 +28,16 @@ constexpr Color kLightSquares[] = {0xffffff, 0xcccccc};
 constexpr Color kDarkSquares[] = {0x666666, 0x444444};
 
 wxColour ColorOf(int32_t color) {
-  return {static_cast<unsigned char>(color), static_cast<unsigned char>(color >> 8), static_cast<unsigned char>(color >> 16)};
+  return {static_cast<unsigned char>(color), static_cast<unsigned char>(color >> 8),
+          static_cast<unsigned char>(color >> 16)};
 }
 
 }  // namespace
 
 ViewCanvas::ViewCanvas(wxWindow* parent, Events events) : events_(std::move(events)) {
   SetBackgroundStyle(wxBG_STYLE_PAINT);
-  Create(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxWANTS_CHARS | wxBORDER_NONE, Label("Picture"));
+  Create(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxWANTS_CHARS | wxBORDER_NONE,
+         Label("Picture"));
   scaler_ = std::make_unique<ViewScaler>([this] { CallAfter([this] { ScaledCame(); }); });
   transform_.SetModeFromKey(settings.DefaultViewZoom);
   Bind(wxEVT_PAINT, &ViewCanvas::OnPaint, this);
@@ -54,7 +56,8 @@ void ViewCanvas::Show(ViewPicturePointer picture) {
   picture_ = std::move(picture);
   scaled_.reset();
   standIn_.Free();
-  if (Showable()) transform_.SetPicture(picture_->picture->image.Width(), picture_->picture->image.Height());
+  if (Showable())
+    transform_.SetPicture(picture_->picture->image.Width(), picture_->picture->image.Height());
   TransformChanged();
 }
 
@@ -104,7 +107,8 @@ void ViewCanvas::SetZoom(ZoomMode mode) {
 
 void ViewCanvas::PanBy(int stepsAcross, int stepsDown) {
   const wxSize size = DeviceSize();
-  transform_.Pan(-static_cast<double>(stepsAcross) * size.x / kPanSteps, -static_cast<double>(stepsDown) * size.y / kPanSteps);
+  transform_.Pan(-static_cast<double>(stepsAcross) * size.x / kPanSteps,
+                 -static_cast<double>(stepsDown) * size.y / kPanSteps);
   UserPanned();
 }
 
@@ -134,11 +138,13 @@ void ViewCanvas::UserPanned() {
   if (events_.placed) events_.placed();
 }
 
-// The picture is drawn at once from what there is; a smaller scale then gets pixels that are made for it.
+// The picture is drawn at once from what there is; a smaller scale then gets pixels that are made
+// for it.
 void ViewCanvas::TransformChanged() {
   if (standIn_.Empty() && Showable() && transform_.Scale() < 1) {
     const PackedImage& source = BestSource().image;
-    const bool exact = source.Width() == transform_.ShownWidth() && source.Height() == transform_.ShownHeight();
+    const bool exact =
+        source.Width() == transform_.ShownWidth() && source.Height() == transform_.ShownHeight();
     if (!exact) scaler_->Request(picture_, transform_.ShownWidth(), transform_.ShownHeight());
   }
   events_.changed();
@@ -154,10 +160,12 @@ void ViewCanvas::ScaledCame() {
 
 ViewSource ViewCanvas::BestSource() const {
   const auto fits = [this](const ViewPixels& pixels) {
-    return pixels.image.Width() == transform_.ShownWidth() && pixels.image.Height() == transform_.ShownHeight();
+    return pixels.image.Width() == transform_.ShownWidth() &&
+           pixels.image.Height() == transform_.ShownHeight();
   };
   if (fits(picture_->fitted)) return {picture_->fitted.image, picture_->fitted.alpha};
-  if (scaled_ != nullptr && fits(scaled_->pixels)) return {scaled_->pixels.image, scaled_->pixels.alpha};
+  if (scaled_ != nullptr && fits(scaled_->pixels))
+    return {scaled_->pixels.image, scaled_->pixels.alpha};
   return {picture_->picture->image, picture_->picture->alpha};
 }
 
@@ -190,7 +198,8 @@ void ViewCanvas::PaintPicture(wxDC& dc) {
   pixels.width = size.x;
   pixels.height = size.y;
   pixels.bytes.resize(static_cast<size_t>(size.x) * static_cast<size_t>(size.y) * 3);
-  const bool smooth = transform_.Scale() < kPlainPixelsAt && ScaleFilterFromKey(settings.ResizeFilter) != ScaleFilter::Nearest;
+  const bool smooth = transform_.Scale() < kPlainPixelsAt &&
+                      ScaleFilterFromKey(settings.ResizeFilter) != ScaleFilter::Nearest;
   const PackedImage opaque;
   const ViewSource source = standIn_.Empty() ? BestSource() : ViewSource{standIn_, opaque};
   DrawView(source, transform_, BackdropHere(), smooth, pixels);
@@ -202,7 +211,8 @@ Backdrop ViewCanvas::BackdropHere() const {
   const bool dark = wxSystemSettings::GetAppearance().IsDark();
   backdrop.squares = settings.ViewModeCheckerboard != 0;
   std::ranges::copy(dark ? kDarkSquares : kLightSquares, backdrop.square);
-  backdrop.side = std::max(static_cast<int>(std::lround(FromDIP(kSquareSide) * GetContentScaleFactor())), 1);
+  backdrop.side =
+      std::max(static_cast<int>(std::lround(FromDIP(kSquareSide) * GetContentScaleFactor())), 1);
   return backdrop;
 }
 
@@ -214,7 +224,8 @@ void ViewCanvas::PaintMessage(wxDC& dc) const {
   const Shade text = Readable({0, 0, 0}, {around.Red(), around.Green(), around.Blue()});
   dc.SetTextForeground(wxColour(text.red, text.green, text.blue));
   const std::string name(platform::FileNameOf(picture_->request.path));
-  dc.DrawLabel(Shown(name) + "\n" + Shown(Tr(StatusMessage(picture_->status))), wxRect(GetClientSize()), wxALIGN_CENTER);
+  dc.DrawLabel(Shown(name) + "\n" + Shown(Tr(StatusMessage(picture_->status))),
+               wxRect(GetClientSize()), wxALIGN_CENTER);
 }
 
 void ViewCanvas::PaintOverlay(wxDC& dc) const {

@@ -13,11 +13,12 @@
 
 namespace fotomill::desktop {
 
-// Shows one picture: zoomed by keys, wheel and double click, moved by dragging, scaled on a thread of its own. Which picture
-// that is, its window decides.
+// Shows one picture: zoomed by keys, wheel and double click, moved by dragging, scaled on a thread
+// of its own. Which picture that is, its window decides.
 class ViewCanvas : public wxWindow {
  public:
-  // What it tells its window. Keys, right clicks and movements of the pointer are events of the canvas.
+  // What it tells its window. Keys, right clicks and movements of the pointer are events of the
+  // canvas.
   struct Events {
     std::function<void()> resized;           // pictures are to fit another size
     std::function<void()> changed;           // another picture or zoom
@@ -30,14 +31,16 @@ class ViewCanvas : public wxWindow {
 
   // What is shown from here on; of a picture that could not be loaded, why.
   void Show(ViewPicturePointer picture);
-  // Another frame of an animation, in the same place. While it plays it is drawn from what there is, quickly rather than well.
+  // Another frame of an animation, in the same place. While it plays it is drawn from what there
+  // is, quickly rather than well.
   void ShowFrame(ViewPicturePointer frame, bool plays);
   // Makes pixels for the zoom of the frame at which the animation was paused.
   void Sharpen() { TransformChanged(); }
   // An image that stands in for a picture of `width` by `height` until that comes.
   void ShowStandIn(PackedImage image, int32_t width, int32_t height);
   const ViewPicturePointer& Picture() const { return picture_; }
-  // The next picture is another one: it is shown as pictures open, unless ViewModeKeepZoom keeps zoom and place.
+  // The next picture is another one: it is shown as pictures open, unless ViewModeKeepZoom keeps
+  // zoom and place.
   void StartAfresh();
   // Lines on top of the picture; empty for none.
   void SetOverlay(const std::vector<std::string>& lines);
@@ -52,7 +55,8 @@ class ViewCanvas : public wxWindow {
   bool CanPan() const { return transform_.CanPan(); }
   // By eighths of the window.
   void PanBy(int stepsAcross, int stepsDown);
-  // Arrows move a picture that is larger than the window. False for other keys, and where all of it is seen.
+  // Arrows move a picture that is larger than the window. False for other keys, and where all of it
+  // is seen.
   bool PanByKey(int key);
   // Zoom and place, to be taken from one canvas to others.
   ViewPlace Place() const { return transform_.Place(); }

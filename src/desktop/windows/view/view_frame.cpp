@@ -36,27 +36,32 @@ constexpr int kPointerMs = 2000;
 }  // namespace
 
 ViewFrame::ViewFrame(Shell& shell, const std::vector<std::string>& list, const std::string& file)
-    : wxFrame(&shell.Window(), wxID_ANY, Label("View"), wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE,
-              "FotomillProfessionalView"),
+    : wxFrame(&shell.Window(), wxID_ANY, Label("View"), wxDefaultPosition, wxDefaultSize,
+              wxDEFAULT_FRAME_STYLE, "FotomillProfessionalView"),
       shell_(shell),
       list_(list),
       pointerTimer_(this),
-      slideshow_({.busy = [this] { return animation_->MustFinish(); }, .show = [this](size_t place) { GoTo(place); }}) {
+      slideshow_({.busy = [this] { return animation_->MustFinish(); },
+                  .show = [this](size_t place) { GoTo(place); }}) {
   place_ = static_cast<size_t>(std::find(list_.begin(), list_.end(), file) - list_.begin());
   if (place_ == list_.size()) {
     list_ = {file};
     place_ = 0;
   }
   SetSize(shell.Window().GetSize());
-  loader_ = std::make_unique<ViewLoader>(kAheadBytes, [this] { CallAfter([this] { PictureCame(); }); });
-  canvas_ = new ViewCanvas(
-      this, {.resized = [this] { Resized(); }, .changed = [this] { ViewChanged(); }, .painted = [this] { LogPaint(); }});
-  bar_ = new AnimationBar(this, {.toggle = [this] { PlayOrNext(), canvas_->SetFocus(); },
-                                 .step = [this](int frames) { StepFrame(frames), canvas_->SetFocus(); }});
+  loader_ =
+      std::make_unique<ViewLoader>(kAheadBytes, [this] { CallAfter([this] { PictureCame(); }); });
+  canvas_ = new ViewCanvas(this, {.resized = [this] { Resized(); },
+                                  .changed = [this] { ViewChanged(); },
+                                  .painted = [this] { LogPaint(); }});
+  bar_ = new AnimationBar(this,
+                          {.toggle = [this] { PlayOrNext(), canvas_->SetFocus(); },
+                           .step = [this](int frames) { StepFrame(frames), canvas_->SetFocus(); }});
   animation_ = std::make_unique<ViewAnimation>(
       *canvas_, *bar_,
-      ViewAnimation::Events{.changed = [this] { ViewChanged(); },
-                            .dressed = [this](const ViewPicturePointer& picture) { return Turned(picture); }});
+      ViewAnimation::Events{
+          .changed = [this] { ViewChanged(); },
+          .dressed = [this](const ViewPicturePointer& picture) { return Turned(picture); }});
   auto* column = new wxBoxSizer(wxVERTICAL);
   column->Add(canvas_, wxSizerFlags(1).Expand());
   column->Add(bar_, wxSizerFlags().Expand());
@@ -100,7 +105,8 @@ void ViewFrame::Step(int files) {
 }
 
 void ViewFrame::GoTo(size_t place) {
-  if (place >= list_.size() || (place == place_ && page_ == 0 && canvas_->Picture() != nullptr)) return;
+  if (place >= list_.size() || (place == place_ && page_ == 0 && canvas_->Picture() != nullptr))
+    return;
   place_ = place;
   StartAfresh();
 }
@@ -159,12 +165,15 @@ bool ViewFrame::AskForPicture() {
 void ViewFrame::ShowStandIn() {
   const ThumbnailPointer thumbnail = shell_.Thumbnails().FindAny(list_[place_]);
   PackedImage image;
-  if (thumbnail == nullptr || thumbnail->pixels.Empty() || ToPacked(thumbnail->pixels, image) != Status::Ok) return;
+  if (thumbnail == nullptr || thumbnail->pixels.Empty() ||
+      ToPacked(thumbnail->pixels, image) != Status::Ok)
+    return;
   constexpr int32_t kUnknown = 16;  // times the thumbnail, where its picture's size is not known
   const bool known = thumbnail->width > 0;
   int32_t width = known ? thumbnail->width : image.Width() * kUnknown;
   int32_t height = known ? thumbnail->height : image.Height() * kUnknown;
-  if ((width > height) != (image.Width() > image.Height())) std::swap(width, height);  // it was turned upright
+  // it was turned upright
+  if ((width > height) != (image.Width() > image.Height())) std::swap(width, height);
   canvas_->ShowStandIn(std::move(image), width, height);
 }
 
@@ -175,10 +184,12 @@ void ViewFrame::WantPictures() {
   const auto want = [&](size_t place) {
     ViewRequest request = RequestOf(place);
     const auto same = [&](const ViewRequest& other) { return other.SamePicture(request); };
-    if (std::none_of(requests.begin(), requests.end(), same)) requests.push_back(std::move(request));
+    if (std::none_of(requests.begin(), requests.end(), same))
+      requests.push_back(std::move(request));
   };
   want(place_);
-  if (const auto upcoming = slideshow_.Upcoming(); upcoming && *upcoming < list_.size()) want(*upcoming);
+  if (const auto upcoming = slideshow_.Upcoming(); upcoming && *upcoming < list_.size())
+    want(*upcoming);
   const int64_t count = static_cast<int64_t>(list_.size());
   for (const int64_t step : {1, -1, 2, -2}) {
     want(static_cast<size_t>(((static_cast<int64_t>(place_) + step) % count + count) % count));
@@ -205,7 +216,8 @@ void ViewFrame::ShowPicture(ViewPicturePointer picture) {
 }
 
 void ViewFrame::WhenShown(std::function<void()> shown) {
-  if (IsCurrent(loaded_)) return shell_.Window().CallAfter(shown);  // a small one may have come already
+  // a small one may have come already
+  if (IsCurrent(loaded_)) return shell_.Window().CallAfter(shown);
   shown_ = std::move(shown);
 }
 
@@ -245,13 +257,17 @@ bool ViewFrame::IsCurrent(const ViewPicturePointer& picture) const {
 
 // --- showing ---
 
-// Each picture and zoom once, with the time since the picture was asked for; each frame of an animation.
+// Each picture and zoom once, with the time since the picture was asked for; each frame of an
+// animation.
 void ViewFrame::LogPaint() {
   if (animation_->Active()) LogEvent("view-frame", animation_->StatusText());
-  const std::string shown = std::to_string(std::lround(canvas_->Zoom() * 100)) + "% " + canvas_->Picture()->request.path;
+  const std::string shown =
+      std::to_string(std::lround(canvas_->Zoom() * 100)) + "% " + canvas_->Picture()->request.path;
   if (shown == painted_) return;
   painted_ = shown;
-  LogEvent("view-painted", shown + " ms=" + std::to_string(std::lround((platform::MonotonicSeconds() - keyTime_) * 1000)));
+  LogEvent("view-painted",
+           shown + " ms=" +
+               std::to_string(std::lround((platform::MonotonicSeconds() - keyTime_) * 1000)));
 }
 
 std::string ViewFrame::StatusLine() const {
@@ -283,7 +299,9 @@ void ViewFrame::ViewChanged() {
   if (canvas_ == nullptr || GetStatusBar() == nullptr) return;  // still being made
   const std::string line = StatusLine();
   const wxString name = Shown(platform::FileNameOf(list_[place_]));
-  const wxString title = turn_ == Orientation::Upright ? Label("%1 - View", name) : Label("%1 (rotated, not saved) - View", name);
+  const wxString title = turn_ == Orientation::Upright
+                             ? Label("%1 - View", name)
+                             : Label("%1 (rotated, not saved) - View", name);
   if (title != GetTitle()) SetTitle(title);
   SetStatusText(Shown(line));
   // A number that changes many times a second is nothing to listen to.
@@ -332,7 +350,8 @@ void ViewFrame::SettingSwitched() {
 void ViewFrame::Leave() {
   slideshow_.Stop();
   if (IsFullScreen()) return ToggleFullScreen();
-  if (BrowserPage* browser = shell_.Tabs().Front()) browser->FocusName(std::string(platform::FileNameOf(list_[place_])));
+  if (BrowserPage* browser = shell_.Tabs().Front())
+    browser->FocusName(std::string(platform::FileNameOf(list_[place_])));
   Close();
 }
 
@@ -369,21 +388,26 @@ void ViewFrame::Turn(Orientation turn) {
 }
 
 void ViewFrame::SaveTurned() {
-  if (saving_ || turn_ == Orientation::Upright) return SetStatusText(Label("The picture is unchanged."));
+  if (saving_ || turn_ == Orientation::Upright)
+    return SetStatusText(Label("The picture is unchanged."));
   const std::string path = list_[place_];
   const wxWeakRef<ViewFrame> self(this);
-  saving_ = shell_.Files().SaveTurned(path, turn_, [self, path](bool done, const std::string& note) {
-    if (!self) return;
-    self->saving_ = false;
-    if (done) self->FilesChanged();
-    if (self->list_[self->place_] == path) self->note_ = note;
-    self->ViewChanged();
-  });
-  SetStatusText(saving_ ? Label("Saving...") : Label("Please wait for the previous file operation."));
+  saving_ =
+      shell_.Files().SaveTurned(path, turn_, [self, path](bool done, const std::string& note) {
+        if (!self) return;
+        self->saving_ = false;
+        if (done) self->FilesChanged();
+        if (self->list_[self->place_] == path) self->note_ = note;
+        self->ViewChanged();
+      });
+  SetStatusText(saving_ ? Label("Saving...")
+                        : Label("Please wait for the previous file operation."));
 }
 
 void ViewFrame::FilesChanged() {
-  if (loaded_ == nullptr || saving_ || !loaded_->HasChanged() || !platform::IsRegularFile(list_[place_])) return;
+  if (loaded_ == nullptr || saving_ || !loaded_->HasChanged() ||
+      !platform::IsRegularFile(list_[place_]))
+    return;
   loader_->Forget(list_[place_]);
   loaded_.reset();
   StartAfresh();
@@ -402,9 +426,12 @@ void ViewFrame::CopyPicture() {
   const ViewPicturePointer& shown = canvas_->Picture();
   if (shown == nullptr || shown->picture == nullptr) return;
   RgbImage pixels;
-  if (PixelsForOthers(*shown, static_cast<Color>(settings.ViewModeBackground), pixels) != Status::Ok) return wxBell();
+  if (PixelsForOthers(*shown, static_cast<Color>(settings.ViewModeBackground), pixels) !=
+      Status::Ok)
+    return wxBell();
   const wxClipboardLocker clipboard;
-  if (!clipboard || !wxTheClipboard->SetData(new wxBitmapDataObject(BitmapOf(pixels)))) return wxBell();
+  if (!clipboard || !wxTheClipboard->SetData(new wxBitmapDataObject(BitmapOf(pixels))))
+    return wxBell();
   SetStatusText(Label("The picture was copied to the clipboard."));
 }
 
@@ -422,7 +449,8 @@ void ViewFrame::OnKey(wxKeyEvent& event) {
   constexpr int kLettersWithCtrl[] = {'C', 'S', 'Y', 'Z'};
   const bool letter = std::ranges::find(kLettersWithCtrl, key) != std::end(kLettersWithCtrl);
   const int typed = !event.ControlDown() ? key : letter ? key - 'A' + WXK_CONTROL_A : 0;
-  if (const KeyCommand<ViewFrame>* command = CommandOfKey(ViewCommands(), typed)) return command->run(*this);
+  if (const KeyCommand<ViewFrame>* command = CommandOfKey(ViewCommands(), typed))
+    return command->run(*this);
   event.Skip();
 }
 

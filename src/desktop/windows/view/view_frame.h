@@ -17,7 +17,8 @@ namespace fotomill::desktop {
 
 class Shell;
 
-// A view window: one picture at a time, with its neighbours of the list that it was opened from decoded ahead.
+// A view window: one picture at a time, with its neighbours of the list that it was opened from
+// decoded ahead.
 class ViewFrame : public wxFrame {
  public:
   // Opens on `file`; `list` has its neighbors, and the file itself.
@@ -47,7 +48,8 @@ class ViewFrame : public wxFrame {
   void FilesChanged();
   // Calls once when the first picture is there, or the window goes without.
   void WhenShown(std::function<void()> shown);
-  // The files that neighbour the picture from here on. False when it is not among them; they are as before then.
+  // The files that neighbour the picture from here on. False when it is not among them; they are as
+  // before then.
   bool UseList(const std::vector<std::string>& list);
   size_t LastPlace() const { return list_.size() - 1; }
   ViewCanvas& Canvas() { return *canvas_; }

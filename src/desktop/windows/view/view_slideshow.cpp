@@ -23,7 +23,8 @@ ViewSlideshow::ViewSlideshow(Events events) : events_(std::move(events)) {
 void ViewSlideshow::Start(size_t place, size_t count) {
   choices_ = unkept_ ? *unkept_ : LoadSlideshowChoices();
   order_.emplace(choices_, count, place, std::random_device()());
-  LogEvent("slideshow", "seconds=" + std::to_string(choices_.seconds) + " random=" + (choices_.random ? "1" : "0") +
+  LogEvent("slideshow", "seconds=" + std::to_string(choices_.seconds) +
+                            " random=" + (choices_.random ? "1" : "0") +
                             " repeat=" + (choices_.repeat ? "1" : "0"));
 }
 
@@ -62,7 +63,8 @@ bool ViewSlideshow::Choose(wxWindow& parent) {
   unkept_.reset();
   if (!SaveSlideshowChoices(*chosen)) {
     unkept_ = chosen;
-    wxMessageBox(Label("The slideshow settings could not be saved."), Label("Slideshow"), wxOK | wxICON_WARNING, &parent);
+    wxMessageBox(Label("The slideshow settings could not be saved."), Label("Slideshow"),
+                 wxOK | wxICON_WARNING, &parent);
   }
   return true;
 }

@@ -21,7 +21,8 @@ class ViewSlideshow {
 
   explicit ViewSlideshow(Events events);
 
-  // Begins at `place` of a list of `count`, as was chosen last. ShownAt is to follow when that picture is on the screen.
+  // Begins at `place` of a list of `count`, as was chosen last. ShownAt is to follow when that
+  // picture is on the screen.
   void Start(size_t place, size_t count);
   void Stop();
   bool Running() const { return order_.has_value(); }

@@ -9,12 +9,15 @@
 
 namespace fotomill::desktop {
 
-// Work that a window has done apart. Goes with the window: what is in work is asked to stop and waited for.
+// Work that a window has done apart. Goes with the window: what is in work is asked to stop and
+// waited for.
 class Background {
  public:
-  // Runs `work` apart, and then `done` on the window's thread, unless it was stopped: with MemoryAllocationError where the work
-  // ran out of memory, Ok otherwise. Work that goes on is stopped first.
-  void Start(wxEvtHandler& window, std::function<void(const StopToken& stop)> work, std::function<void(Status)> done) {
+  // Runs `work` apart, and then `done` on the window's thread, unless it was stopped: with
+  // MemoryAllocationError where the work ran out of memory, Ok otherwise. Work that goes on is
+  // stopped first.
+  void Start(wxEvtHandler& window, std::function<void(const StopToken& stop)> work,
+             std::function<void(Status)> done) {
     Stop();
     const auto wanted = std::make_shared<bool>(true);
     wanted_ = wanted;

@@ -45,7 +45,9 @@ constexpr SymbolShape kSymbols[] = {
     {"pause", "<path d='M5 3 V13 M11 3 V13' stroke-width='2.6'/>"},
 };
 
-std::string HexColor(const wxColour& color) { return std::string(color.GetAsString(wxC2S_HTML_SYNTAX).utf8_str()); }
+std::string HexColor(const wxColour& color) {
+  return std::string(color.GetAsString(wxC2S_HTML_SYNTAX).utf8_str());
+}
 
 void ReplaceAll(std::string& text, std::string_view from, const std::string& to) {
   for (size_t at = text.find(from); at != std::string::npos; at = text.find(from, at + to.size())) {

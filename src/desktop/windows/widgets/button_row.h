@@ -15,8 +15,9 @@ struct RowButton {
   std::function<void()> run;  // when the button is pressed
 };
 
-// The buttons at the foot of a frame, on its panel, the one that closes it apart at the right. A button runs when it is pressed
-// and when the frame's accelerators send its number, as long as it is enabled.
+// The buttons at the foot of a frame, on its panel, the one that closes it apart at the right. A
+// button runs when it is pressed and when the frame's accelerators send its number, as long as it
+// is enabled.
 wxSizer* BuildButtonRow(wxFrame& frame, wxWindow& panel, std::span<const RowButton> rows);
 
 }  // namespace fotomill::desktop

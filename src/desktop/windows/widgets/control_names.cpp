@@ -31,13 +31,15 @@ namespace fotomill::desktop {
 
 namespace {
 
-// Whether a window has a name of its own, not the one that wxWidgets gives to every one of its kind.
+// Whether a window has a name of its own, not the one that wxWidgets gives to every one of its
+// kind.
 bool HasOwnName(const wxWindow& window) {
-  static const wxString kNamesOfKinds[] = {wxEmptyString,         wxPanelNameStr,    wxControlNameStr,   wxTextCtrlNameStr,
-                                           wxStaticTextNameStr,   wxButtonNameStr,   wxCheckBoxNameStr,  wxRadioButtonNameStr,
-                                           wxRadioBoxNameStr,     wxChoiceNameStr,   wxComboBoxNameStr,  wxListBoxNameStr,
-                                           wxListCtrlNameStr,     wxTreeCtrlNameStr, wxSliderNameStr,    wxSearchCtrlNameStr,
-                                           wxDataViewCtrlNameStr, "wxSpinCtrl",      "wxSpinCtrlDouble", "scrolledWindow"};
+  static const wxString kNamesOfKinds[] = {
+      wxEmptyString,         wxPanelNameStr,    wxControlNameStr,   wxTextCtrlNameStr,
+      wxStaticTextNameStr,   wxButtonNameStr,   wxCheckBoxNameStr,  wxRadioButtonNameStr,
+      wxRadioBoxNameStr,     wxChoiceNameStr,   wxComboBoxNameStr,  wxListBoxNameStr,
+      wxListCtrlNameStr,     wxTreeCtrlNameStr, wxSliderNameStr,    wxSearchCtrlNameStr,
+      wxDataViewCtrlNameStr, "wxSpinCtrl",      "wxSpinCtrlDouble", "scrolledWindow"};
   return std::ranges::find(kNamesOfKinds, window.GetName()) == std::end(kNamesOfKinds);
 }
 
@@ -61,7 +63,8 @@ wxString TextBefore(const wxWindow& window) {
 
 // Whether a control is made of windows that no one else sees.
 bool IsComposite(wxWindow* window) {
-  return dynamic_cast<wxListCtrl*>(window) != nullptr || dynamic_cast<wxTreeListCtrl*>(window) != nullptr;
+  return dynamic_cast<wxListCtrl*>(window) != nullptr ||
+         dynamic_cast<wxTreeListCtrl*>(window) != nullptr;
 }
 
 // Empty where the window's own texts say enough, or nothing is known.
@@ -75,13 +78,15 @@ wxString NameOf(wxWindow& window) {
 
 void NameControl(wxWindow& window) {
   // The buttons of toolbars have names already.
-  if (window.IsTopLevel() || dynamic_cast<wxStaticText*>(&window) != nullptr || dynamic_cast<wxToolBar*>(&window) != nullptr)
+  if (window.IsTopLevel() || dynamic_cast<wxStaticText*>(&window) != nullptr ||
+      dynamic_cast<wxToolBar*>(&window) != nullptr)
     return;
   const wxString name = NameOf(window);
   if (!name.empty()) ReportToScreenReader(window, name);
 }
 
-// A window that has just come may still be being made, so that its name comes later: it is named when nothing else is to do.
+// A window that has just come may still be being made, so that its name comes later: it is named
+// when nothing else is to do.
 class Newcomers : public wxEventFilter {
  public:
   Newcomers() { wxEvtHandler::AddFilter(this); }

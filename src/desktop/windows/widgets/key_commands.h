@@ -10,8 +10,8 @@
 
 namespace fotomill::desktop {
 
-// One thing that a window without a menu bar can do, by keys and by the menu of the right mouse button, whose order is that of
-// the rows; a row without text is a line there.
+// One thing that a window without a menu bar can do, by keys and by the menu of the right mouse
+// button, whose order is that of the rows; a row without text is a line there.
 template <typename Window>
 struct KeyCommand {
   static constexpr int kMostKeys = 3;
@@ -20,7 +20,8 @@ struct KeyCommand {
   const char* shownKey;  // beside the text
   int keys[kMostKeys];   // WXK_* or characters; 0 ends them
   void (*run)(Window& window);
-  bool (*checked)(const Window& window) = nullptr;  // whether its menu item has a mark; null for one that never has
+  // whether its menu item has a mark; null for one that never has
+  bool (*checked)(const Window& window) = nullptr;
 };
 
 // The command of a key, null if none.
@@ -35,7 +36,8 @@ const KeyCommand<Window>* CommandOfKey(std::span<const KeyCommand<Window>> comma
 
 // Shows the commands of `window` as a menu at a place of `owner`, which may be a part of it.
 template <typename Window>
-void ShowCommandMenu(std::span<const KeyCommand<Window>> commands, Window& window, wxWindow& owner, const wxPoint& place) {
+void ShowCommandMenu(std::span<const KeyCommand<Window>> commands, Window& window, wxWindow& owner,
+                     const wxPoint& place) {
   wxMenu menu;
   int id = wxID_HIGHEST + 1;
   for (const KeyCommand<Window>& command : commands) {

@@ -17,8 +17,8 @@ Shade SystemShade(wxSystemColour index) {
 }  // namespace
 
 ListPalette CurrentPalette() {
-  return PaletteOf(SystemShade(wxSYS_COLOUR_LISTBOX), SystemShade(wxSYS_COLOUR_LISTBOXTEXT), SystemShade(wxSYS_COLOUR_HIGHLIGHT),
-                   SystemShade(wxSYS_COLOUR_HIGHLIGHTTEXT));
+  return PaletteOf(SystemShade(wxSYS_COLOUR_LISTBOX), SystemShade(wxSYS_COLOUR_LISTBOXTEXT),
+                   SystemShade(wxSYS_COLOUR_HIGHLIGHT), SystemShade(wxSYS_COLOUR_HIGHLIGHTTEXT));
 }
 
 wxColour FaultColor() {
@@ -35,6 +35,9 @@ int TextWidth(const wxWindow& window, int width) {
   return static_cast<int>(std::lround(window.FromDIP(width) * TextScale(window)));
 }
 
-wxColour BarColor() { return ToWx(Blend(SystemShade(wxSYS_COLOUR_WINDOW), SystemShade(wxSYS_COLOUR_HIGHLIGHT), 1.0 / 7)); }
+wxColour BarColor() {
+  return ToWx(
+      Blend(SystemShade(wxSYS_COLOUR_WINDOW), SystemShade(wxSYS_COLOUR_HIGHLIGHT), 1.0 / 7));
+}
 
 }  // namespace fotomill::desktop

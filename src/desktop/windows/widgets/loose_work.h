@@ -10,8 +10,8 @@
 
 namespace fotomill::desktop {
 
-// Work that nobody waits for, since a folder may hang: it is asked to stop, and what it reports when nobody is interested any more is
-// dropped. Goes with the window that wants its results.
+// Work that nobody waits for, since a folder may hang: it is asked to stop, and what it reports
+// when nobody is interested any more is dropped. Goes with the window that wants its results.
 class LooseWork {
  public:
   // Has something done on the window's thread, unless the work was stopped meanwhile.
@@ -22,8 +22,11 @@ class LooseWork {
   LooseWork& operator=(const LooseWork&) = delete;
   ~LooseWork() { Stop(); }
 
-  // Runs `work` apart; where it runs out of memory, `failed` on the window's thread. Work that goes on is stopped first.
-  void Start(std::function<void(const StopToken& stop, const Report& report)> work, std::function<void()> failed = [] {}) {
+  // Runs `work` apart; where it runs out of memory, `failed` on the window's thread. Work that goes
+  // on is stopped first.
+  void Start(
+      std::function<void(const StopToken& stop, const Report& report)> work,
+      std::function<void()> failed = [] {}) {
     Stop();
     source_.emplace();
     const auto report = [stop = source_->Token()](std::function<void()> action) {

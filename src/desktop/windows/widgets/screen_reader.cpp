@@ -9,8 +9,9 @@ namespace fotomill::desktop {
 
 namespace {
 
-// wxAccessible speaks on Windows only. Under GTK screen readers read the accessible objects behind the widgets, which wxWidgets
-// has no words for; the few functions that it takes are those of the libraries that wxWidgets itself has loaded.
+// wxAccessible speaks on Windows only. Under GTK screen readers read the accessible objects behind
+// the widgets, which wxWidgets has no words for; the few functions that it takes are those of the
+// libraries that wxWidgets itself has loaded.
 class Gtk {
  public:
   static const Gtk& The() {
@@ -30,7 +31,9 @@ class Gtk {
     std::vector<void*> parts;
     if (isA_(widget, container_()) != 0) {
       forAll_(
-          widget, [](void* part, void* list) { static_cast<std::vector<void*>*>(list)->push_back(part); }, &parts);
+          widget,
+          [](void* part, void* list) { static_cast<std::vector<void*>*>(list)->push_back(part); },
+          &parts);
     }
     return parts;
   }
@@ -40,7 +43,8 @@ class Gtk {
   using Visit = void(void* part, void* data);
 
   Gtk() {
-    if (!gtk_.LoadSystem("libgtk-3.so.0") || !atk_.LoadSystem("libatk-1.0.so.0") || !objects_.LoadSystem("libgobject-2.0.so.0")) {
+    if (!gtk_.LoadSystem("libgtk-3.so.0") || !atk_.LoadSystem("libatk-1.0.so.0") ||
+        !objects_.LoadSystem("libgobject-2.0.so.0")) {
       return;
     }
     accessible_ = gtk_.FunctionNamed<void*(void*)>("gtk_widget_get_accessible");
@@ -50,8 +54,9 @@ class Gtk {
     isA_ = objects_.FunctionNamed<int(void*, size_t)>("g_type_check_instance_is_a");
     setName_ = atk_.FunctionNamed<void(void*, const char*)>("atk_object_set_name");
     setDescription_ = atk_.FunctionNamed<void(void*, const char*)>("atk_object_set_description");
-    here_ = accessible_ != nullptr && canFocus_ != nullptr && forAll_ != nullptr && container_ != nullptr && isA_ != nullptr &&
-            setName_ != nullptr && setDescription_ != nullptr;
+    here_ = accessible_ != nullptr && canFocus_ != nullptr && forAll_ != nullptr &&
+            container_ != nullptr && isA_ != nullptr && setName_ != nullptr &&
+            setDescription_ != nullptr;
   }
 
   platform::SharedLibrary gtk_, atk_, objects_;
@@ -65,8 +70,8 @@ class Gtk {
   void (*setDescription_)(void*, const char*) = nullptr;
 };
 
-void SetTextsOfParts(void* widget, const std::vector<void*>& windows, const wxScopedCharBuffer& name,
-               const wxScopedCharBuffer& description) {
+void SetTextsOfParts(void* widget, const std::vector<void*>& windows,
+                     const wxScopedCharBuffer& name, const wxScopedCharBuffer& description) {
   const Gtk& gtk = Gtk::The();
   for (void* const part : gtk.PartsOf(widget)) {
     if (std::ranges::find(windows, part) != windows.end()) continue;

@@ -22,7 +22,8 @@ inline std::string Utf8(const wxString& text) {
   return std::string(bytes.data(), bytes.length());
 }
 
-// A text of the program in the user's language, as Tr and TrCount give it; arguments may be wxStrings, too.
+// A text of the program in the user's language, as Tr and TrCount give it; arguments may be
+// wxStrings, too.
 inline wxString Label(const char* text) { return wxString::FromUTF8(Tr(text)); }
 inline TextArgument LabelArgument(const wxString& text) { return Utf8(text); }
 template <typename Argument>
@@ -35,7 +36,8 @@ wxString Label(const char* text, const Arguments&... arguments) {
   return wxString::FromUTF8(TrArguments(text, {LabelArgument(arguments)...}));
 }
 template <typename... Arguments>
-wxString LabelCount(const char* one, const char* many, uint64_t count, const Arguments&... arguments) {
+wxString LabelCount(const char* one, const char* many, uint64_t count,
+                    const Arguments&... arguments) {
   return wxString::FromUTF8(TrCountArguments(one, many, count, {LabelArgument(arguments)...}));
 }
 
