@@ -5,6 +5,7 @@
 #include <utility>
 #include <vector>
 
+#include "core/data_folder.h"
 #include "core/text.h"
 #include "platform/files.h"
 #include "platform/folders.h"
@@ -35,10 +36,6 @@ std::vector<std::string>& ModulesOff() {
 
 bool IsOn(std::string_view name) {
   return std::ranges::find(ModulesOff(), name) == ModulesOff().end();
-}
-
-std::string FolderOr(const std::string& folder) {
-  return folder.empty() ? platform::JoinFolder(platform::ProgramFolder(), "plugin") : folder;
 }
 
 // "FMWPL*.so": the names of modules. "_x64" marks the twin of a 32-bit module and is never loaded.
@@ -122,15 +119,21 @@ bool ComesBefore(const LoadedEntry& a, const LoadedEntry& b) {
 
 }  // namespace
 
+std::vector<std::string> PluginFolders() {
+  const std::string program = platform::ProgramFolder();
+  std::vector<std::string> folders = {
+      platform::JoinFolder(program, "plugin"),
+      platform::JoinFolder(platform::FolderOf(program), "lib/fotomill/plugin")};
+  if (!DataFolder().empty()) folders.push_back(platform::JoinFolder(DataFolder(), "plugin"));
+  return folders;
+}
+
 int32_t ScanPlugins(const std::string& folder) {
   UnloadPlugins();
-  const std::string place = FolderOr(folder);
-  const auto names = platform::ListFolder(place);
-  if (!names) return 0;
   std::vector<LoadedEntry> table;
-  for (const platform::FolderEntry& name : *names) {
-    if (!IsModuleName(name.name) || !IsOn(name.name)) continue;
-    const std::string path = platform::JoinFolder(place, name.name);
+  for (const PluginModule& module : PluginModules(folder)) {
+    if (!module.on) continue;
+    const std::string path = platform::JoinFolder(module.folder, module.name);
     int32_t registered = 0;
     while (registered < kFormatsPerModule && RegisterFormat(path, registered, table)) ++registered;
   }
@@ -141,10 +144,15 @@ int32_t ScanPlugins(const std::string& folder) {
 
 std::vector<PluginModule> PluginModules(const std::string& folder) {
   std::vector<PluginModule> modules;
-  const auto names = platform::ListFolder(FolderOr(folder));
-  if (!names) return modules;
-  for (const platform::FolderEntry& name : *names) {
-    if (IsModuleName(name.name)) modules.push_back({name.name, IsOn(name.name)});
+  for (const std::string& place : folder.empty() ? PluginFolders() : std::vector{folder}) {
+    const auto entries = platform::ListFolder(place);
+    if (!entries) continue;
+    for (const platform::FolderEntry& entry : *entries) {
+      const bool known =
+          std::ranges::find(modules, entry.name, &PluginModule::name) != modules.end();
+      if (IsModuleName(entry.name) && !known)
+        modules.push_back({entry.name, place, IsOn(entry.name)});
+    }
   }
   return modules;
 }

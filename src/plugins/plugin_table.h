@@ -39,15 +39,20 @@ static_assert(sizeof(void*) != 4 || sizeof(PluginEntry) == 1088);  // as 32-bit 
 // At most this many formats of one module are registered.
 inline constexpr int32_t kFormatsPerModule = 32;
 
-// Loads every module of `folder` (the folder "plugin" beside the program unless one is given) and
-// registers its formats, sorted by extension and then by module path. Modules that lack a required
-// export or refuse are skipped in silence. Returns the number of formats. A second scan replaces
-// the first.
+// Where modules are looked for, in this order: the folder "plugin" beside the program as it is
+// built, "lib/fotomill/plugin" of the prefix that it is installed in, and "plugin" in the user's
+// data folder.
+std::vector<std::string> PluginFolders();
+// Loads every module of `folder` (of PluginFolders() unless one is given; of modules with one name
+// the first) and registers its formats, sorted by extension and then by module path. Modules that
+// lack a required export or refuse are skipped in silence. Returns the number of formats. A second
+// scan replaces the first.
 int32_t ScanPlugins(const std::string& folder = {});
-// The modules of that folder by file name, loaded or not, and the user's switch of each: one that
-// is off is passed over by the next scan.
+// The modules there, loaded or not, and the user's switch of each: one that is off is passed over
+// by the next scan.
 struct PluginModule {
-  std::string name;
+  std::string name;    // of the file
+  std::string folder;  // it is in
   bool on = true;
 };
 std::vector<PluginModule> PluginModules(const std::string& folder = {});

@@ -69,9 +69,10 @@ bool IsRegistered(const std::string& path) {
 
 // The formats of each module, and the modules without one.
 void ReportPlugins(ResultOutput& output, bool enabled) {
-  const std::string folder = FolderFact(platform::JoinFolder(platform::ProgramFolder(), "plugin"));
-  Report(output, Tr("Plug-in folder"),
-         enabled ? folder : Tr("%1 (disabled by --no-plugins)", folder));
+  for (const std::string& folder : PluginFolders()) {
+    Report(output, Tr("Plug-in folder"),
+           enabled ? FolderFact(folder) : Tr("%1 (disabled by --no-plugins)", FolderFact(folder)));
+  }
   if (!enabled) return;
   (void)ScanPlugins();
   std::map<std::string, std::string> formats;
@@ -81,13 +82,11 @@ void ReportPlugins(ResultOutput& output, bool enabled) {
   }
   for (const auto& [path, list] : formats)
     Report(output, "  " + EscapeControls(platform::FileNameOf(path)), list);
-  const std::string modules = platform::JoinFolder(platform::ProgramFolder(), "plugin");
-  for (const platform::FolderEntry& entry :
-       platform::ListFolder(modules).value_or(std::vector<platform::FolderEntry>())) {
-    const bool module = UpperCase(entry.name).starts_with("FMWPL") &&
-                        entry.name.ends_with(platform::kModuleExtension);
-    if (module && !IsRegistered(platform::JoinFolder(modules, entry.name))) {
-      Report(output, "  " + EscapeControls(entry.name),
+  for (const PluginModule& module : PluginModules()) {
+    if (!module.on) {
+      Report(output, "  " + EscapeControls(module.name), Tr("disabled"));
+    } else if (!IsRegistered(platform::JoinFolder(module.folder, module.name))) {
+      Report(output, "  " + EscapeControls(module.name),
              Tr("not used: not a module for this system, or it failed to start"));
     }
   }

@@ -18,6 +18,7 @@
 #include "cli/commands/turn.h"
 #include "cli/commands/verify.h"
 #include "cli/frame/completion.h"
+#include "cli/frame/manual.h"
 #include "texts/texts.h"
 
 namespace fotomill::cli {
@@ -60,6 +61,7 @@ constexpr Command kCommands[] = {
     {"history add",   TrLater("record the use of a file in the file history"),          Needs::Settings, SetUpHistoryAdd},
     {"history clear", TrLater("delete the file history"),                               Needs::Settings, SetUpHistoryClear},
     {"doctor",  TrLater("show paths and libraries, and what is disabled or missing"),   Needs::Formats,  SetUpDoctor},
+    {"manual",  TrLater("write the man pages into a folder"),                           Needs::Nothing,  SetUpManual},
     {"completion", TrLater("print a completion script for a shell"),                    Needs::Nothing,  SetUpCompletion},
 };
 // clang-format on

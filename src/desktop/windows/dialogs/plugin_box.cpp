@@ -106,7 +106,7 @@ void PluginBox::AddModule(const PluginModule& module) {
   bool loaded = false;
   for (int32_t row = 0; row < PluginFormatCount(); ++row) {
     const PluginEntry& entry = PluginRow(row);
-    if (platform::FileNameOf(entry.path) != module.name) continue;
+    if (entry.path.view() != platform::JoinFolder(module.folder, module.name)) continue;
     std::string can = entry.exports.writeImage != nullptr ? Tr("read and write") : Tr("read");
     if (entry.exports.configure != nullptr) can.append(", ").append(Tr("settings"));
     add(row, entry.extension, entry.textA, entry.textB, can);
