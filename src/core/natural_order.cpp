@@ -4,7 +4,7 @@
 
 #include "core/text.h"
 
-namespace fotomill::desktop {
+namespace fotomill {
 
 namespace {
 
@@ -72,4 +72,4 @@ bool MatchesFilter(std::string_view text, std::string_view pattern) {
          pattern.empty();
 }
 
-}  // namespace fotomill::desktop
+}  // namespace fotomill

@@ -100,10 +100,11 @@ int RunSheet(const SheetOptions& options, const CommandContext& context) {
       !platform::IsFolder(options.dest)) {
     return UsageError(context, Tr("\"%1\" is not a folder.", options.dest));
   }
-  const auto files = SelectFiles(options.selection, context);
-  if (!files) return kExitUsage;
+  const auto selection = SelectFiles(options.selection, context);
+  if (!selection) return kExitUsage;
 
   ResultOutput output(context, options.json);
+  output.CloseWith(selection->leftOut);
   TerminalBox box(output, true, false);
   TerminalPrompts prompts(context, output);
   job.destinationFolder = options.dest;
@@ -113,7 +114,7 @@ int RunSheet(const SheetOptions& options, const CommandContext& context) {
   sheet.page = {.reduce = options.reduce, .dryRun = options.dryRun};
   sheet.reduceHint = Tr("Use --reduce to reduce them.");
   sheet.jobs = static_cast<uint32_t>(options.jobs);
-  if (const Status status = RunContactSheet(*files, sheet, job); status != Status::Ok) {
+  if (const Status status = RunContactSheet(selection->files, sheet, job); status != Status::Ok) {
     const std::string hint =
         status == Status::ResourceError ? std::string(" ") + Tr(kNoFont) : std::string();
     output.Message(output.ShownMessage(options.dest) + ": " + Tr(StatusMessage(status)) + hint);

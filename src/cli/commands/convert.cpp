@@ -162,20 +162,21 @@ int RunConvert(const ConvertOptions& options, const CommandContext& context) {
   BatchFunction function = FunctionOf(options, recipe.get());
   if (const std::string wrong = TakeRecipe(options, recipe, job, function); !wrong.empty())
     return UsageError(context, wrong);
-  const auto files = SelectFiles(options.selection, context);
-  if (!files) return kExitUsage;
-  if (!options.out.empty() && files->size() != 1)
+  const auto selection = SelectFiles(options.selection, context);
+  if (!selection) return kExitUsage;
+  if (!options.out.empty() && selection->files.size() != 1)
     return UsageError(context, Tr("--out takes exactly one picture."));
   if (options.quality > 0) job.encode.jpegQuality = job.encode.webpQuality = options.quality;
 
   ResultOutput output(context, options.json);
+  output.CloseWith(selection->leftOut);
   TerminalPrompts prompts(context, output);
   job.destinationFolder = options.dest;
   job.prompts = context.MayAsk() ? &prompts : nullptr;
   SetOverwritePolicy(options, context, job);
   TerminalBox box(output, options.verbose, options.overwrite.empty() && !job.overwrite.prompt);
   job.box = &box;
-  if (const Status status = RunBatch(*files, function, job); status != Status::Ok) {
+  if (const Status status = RunBatch(selection->files, function, job); status != Status::Ok) {
     output.Message(output.ShownMessage(options.dest) + ": " + Tr(StatusMessage(status)));
     return kExitFailed;
   }

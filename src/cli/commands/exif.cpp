@@ -104,7 +104,9 @@ class ExifRun {
   ExifRun(const ExifOptions& options, const CommandContext& context)
       : options_(options), output_(context, options.json) {}
 
-  void ReportFiles(const std::vector<SelectedFile>& files) {
+  void ReportFiles(const Selection& selection) {
+    output_.CloseWith(selection.leftOut);
+    const std::vector<SelectedFile>& files = selection.files;
     for (const SelectedFile& file : files) {
       if (!output_.GoesOn()) return;
       const Outcome outcome =
@@ -203,17 +205,17 @@ int RunExif(const ExifOptions& options, const CommandContext& context) {
   }
   const bool alone =
       measures && context.names.values.empty() && options.selection.filesFrom.empty();
-  const auto files = alone ? std::vector<SelectedFile>{} : SelectFiles(options.selection, context);
-  if (!files) return kExitUsage;
+  const auto selection = alone ? Selection() : SelectFiles(options.selection, context);
+  if (!selection) return kExitUsage;
   if (!options.thumbnail.empty()) {
-    if (files->size() != 1)
+    if (selection->files.size() != 1)
       return UsageError(context, Tr("--thumbnail takes exactly one picture."));
-    if (IsSameFile(files->front().name, options.thumbnail)) {
+    if (IsSameFile(selection->files.front().name, options.thumbnail)) {
       return UsageError(context, Tr("--thumbnail names the picture itself."));
     }
   }
   ExifRun run(options, context);
-  run.ReportFiles(*files);
+  run.ReportFiles(*selection);
   if (measures) run.ReportDistance(degrees);
   return alone ? kExitOk : run.Finish();
 }

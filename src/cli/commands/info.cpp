@@ -131,11 +131,12 @@ void ReportFile(const SelectedFile& file, ResultOutput& output, UsedFiles& used)
 }
 
 int RunInfo(const InfoOptions& options, const CommandContext& context) {
-  const auto files = SelectFiles(options.selection, context);
-  if (!files) return kExitUsage;
+  const auto selection = SelectFiles(options.selection, context);
+  if (!selection) return kExitUsage;
   ResultOutput output(context, options.json);
+  output.CloseWith(selection->leftOut);
   UsedFiles used(FileFunction::GetInfo);
-  for (const SelectedFile& file : *files) {
+  for (const SelectedFile& file : selection->files) {
     if (!output.GoesOn()) break;
     ReportFile(file, output, used);
   }

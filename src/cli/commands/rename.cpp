@@ -41,24 +41,25 @@ int RunUndo(const RenameCommandOptions& options, const std::vector<SelectedFile>
 
 int RunRenameCommand(const RenameCommandOptions& options, const CommandContext& context) {
   const SelectionOptions& selection = options.selection;
-  std::vector<SelectedFile> files;
+  Selection chosen;
   if (!options.undo || !context.names.values.empty() || !selection.filesFrom.empty()) {
     auto selected = SelectFiles(selection, context);
     if (!selected) return kExitUsage;
-    files = std::move(*selected);
+    chosen = std::move(*selected);
   }
   ResultOutput output(context, options.json);
+  output.CloseWith(chosen.leftOut);
   TerminalBox box(output, true, false);
   BatchJob job = NewBatchJob();
   job.box = &box;
   int status = kExitOk;
   if (options.undo) {
-    status = RunUndo(options, files, output, job);
+    status = RunUndo(options, chosen.files, output, job);
   } else {
     RenameOptions rename{.rules = SequentialRenameRulesFromSettings(), .dryRun = options.dryRun};
     if (options.digits > 0) rename.rules.digits = options.digits;
     if (options.seed >= 0) rename.seed = static_cast<uint64_t>(options.seed);
-    RunRename(files, rename, job);
+    RunRename(chosen.files, rename, job);
   }
   return std::max(status, FinishBatch(job));
 }

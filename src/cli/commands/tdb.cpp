@@ -151,11 +151,12 @@ int AddFiles(const std::vector<SelectedFile>& files, uint32_t jobs, ThumbnailDat
 int RunAdd(const TdbOptions& options, CommandContext& context) {
   const std::string path = context.names.values[0];
   context.names.values.erase(context.names.values.begin());
-  const auto files = SelectFiles(options.selection, context);
-  if (!files) return kExitUsage;
+  const auto selection = SelectFiles(options.selection, context);
+  if (!selection) return kExitUsage;
   ResultOutput output(context, false);
+  output.CloseWith(selection->leftOut);
   if (options.dryRun) {
-    for (const SelectedFile& file : *files) {
+    for (const SelectedFile& file : selection->files) {
       if (file.status != Status::Ok) {
         output.Failure(file.name, file.status, file.hint);
         continue;
@@ -169,7 +170,7 @@ int RunAdd(const TdbOptions& options, CommandContext& context) {
   if (!OpenDatabase(database, path, true, output)) return output.Finish();
   const uint32_t jobs =
       options.jobs == 0 ? platform::CoreCount() : static_cast<uint32_t>(options.jobs);
-  return AddFiles(*files, jobs, database, output);
+  return AddFiles(selection->files, jobs, database, output);
 }
 
 int RunFind(const TdbOptions& options, CommandContext& context) {

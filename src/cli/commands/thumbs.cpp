@@ -125,21 +125,23 @@ void ReportMaking(const SelectedFile& file, const Making& making, ResultOutput& 
 
 // Runs on several threads, with the same output and the same thumbnail files as on one.
 int RunMake(const ThumbsOptions& options, const CommandContext& context) {
-  const auto files = SelectFiles(options.selection, context);
-  if (!files) return kExitUsage;
-  std::vector<Making> makings = PlanMaking(*files, options.force);
+  const auto selection = SelectFiles(options.selection, context);
+  if (!selection) return kExitUsage;
+  const std::vector<SelectedFile>& files = selection->files;
+  std::vector<Making> makings = PlanMaking(files, options.force);
   const ThumbnailOptions thumbnails = ThumbnailOptionsFromSettings();
   ResultOutput output(context, options.json);
+  output.CloseWith(selection->leftOut);
   UsedFiles used(options.dryRun ? std::nullopt : std::optional(FileFunction::Catalog));
   std::atomic<bool> goesOn = true;
   OrderedRun run({
       .work =
           [&](size_t item) {
             if (options.dryRun) return Status::Ok;
-            const FolderScope folder((*files)[item].name);
+            const FolderScope folder(files[item].name);
             for (const size_t i : makings[item].together) {
               Making& making = makings[i];
-              const std::string& name = (*files)[i].name;
+              const std::string& name = files[i].name;
               making.status = Guarded([&] { return MakeThumbnail(name, thumbnails); });
               if (making.status == Status::Ok) continue;
               making.hint = making.status == Status::ErrorCreatingFile
@@ -150,14 +152,14 @@ int RunMake(const ThumbsOptions& options, const CommandContext& context) {
           },
       .deliver =
           [&](size_t item, Status) {
-            ReportMaking((*files)[item], makings[item], output, used);
-            output.ShowProgress(item + 1, files->size());
+            ReportMaking(files[item], makings[item], output, used);
+            output.ShowProgress(item + 1, files.size());
             goesOn = output.GoesOn();
           },
       .goesOn = [&] { return goesOn && platform::PendingExit() == 0; },
       .tick = [&] { output.Tick(); },
   });
-  run.Run(files->size(),
+  run.Run(files.size(),
           options.jobs == 0 ? platform::CoreCount() : static_cast<uint32_t>(options.jobs));
   return output.Finish();
 }

@@ -67,8 +67,8 @@ std::string CheckOptions(const TurnOptions& options) {
 int RunTurnCommand(const TurnOptions& options, const CommandContext& context) {
   if (const std::string wrong = CheckOptions(options); !wrong.empty())
     return UsageError(context, wrong);
-  const auto files = SelectFiles(options.selection, context);
-  if (!files) return kExitUsage;
+  const auto selection = SelectFiles(options.selection, context);
+  if (!selection) return kExitUsage;
   TurnFunction function{
       .request = {.turn = Composed(TurnNamed(options.rotate), TurnNamed(options.flip)),
                   .seenByExif = options.byExif || settings.ExifAdjustOrientation != 0,
@@ -83,9 +83,10 @@ int RunTurnCommand(const TurnOptions& options, const CommandContext& context) {
   job.overwrite.prompt = options.overwrite != "replace";
   job.overwrite.skip = options.overwrite == "skip";
   ResultOutput output(context, options.json);
+  output.CloseWith(selection->leftOut);
   TerminalBox box(output, true, false);
   job.box = &box;
-  (void)RunTurn(*files, function, job);  // this box always opens
+  (void)RunTurn(selection->files, function, job);  // this box always opens
   return FinishBatch(job);
 }
 

@@ -53,12 +53,13 @@ Status VerifyFile(const std::string& name, std::string& hint, std::string& note)
 }
 
 int RunVerify(const VerifyOptions& options, const CommandContext& context) {
-  const auto files = SelectFiles(options.selection, context);
-  if (!files) return kExitUsage;
+  const auto selection = SelectFiles(options.selection, context);
+  if (!selection) return kExitUsage;
   ResultOutput output(context, options.json);
-  output.Expect(files->size());
+  output.CloseWith(selection->leftOut);
+  output.Expect(selection->files.size());
   UsedFiles used(FileFunction::View);
-  for (const SelectedFile& file : *files) {
+  for (const SelectedFile& file : selection->files) {
     if (!output.GoesOn()) break;
     std::string hint = file.hint, note;
     const Status status =

@@ -1,10 +1,14 @@
 #include "cli/frame/file_selection.h"
 
+#include <algorithm>
 #include <set>
 #include <utility>
 
+#include "cli/frame/file_order.h"
+#include "cli/frame/left_out_files.h"
 #include "cli/frame/options.h"
 #include "core/limits.h"
+#include "core/natural_order.h"
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "registry/registry.h"
@@ -39,7 +43,7 @@ std::vector<std::string> SplitList(std::string_view list, char end) {
 
 class Selector {
  public:
-  explicit Selector(bool recursive) : recursive_(recursive) {}
+  explicit Selector(const SelectionOptions& options) : options_(options) {}
 
   void Add(const std::string& name) {
     const platform::FileFacts facts = platform::FactsOf(name);
@@ -53,24 +57,45 @@ class Selector {
       files_.push_back({name, {}, Status::Ok, {}});
     }
   }
-  std::vector<SelectedFile> Take() { return std::move(files_); }
+  Selection Take() {
+    SortFiles(options_.sort, files_);
+    if (options_.reverse) std::ranges::reverse(files_);
+    return {std::move(files_), leftOut_.Line()};
+  }
 
  private:
   void AddFolder(const std::string& folder, const std::string& below, int depth) {
-    const auto entries = platform::ListFolder(folder);
+    auto entries = platform::ListFolder(folder);
     if (!entries) {
       files_.push_back(
           {folder, below, Status::FileOpenError, WithReason(Tr("The folder cannot be read."))});
       return;
     }
+    if (options_.sort.empty()) {
+      std::ranges::sort(*entries, [](const auto& a, const auto& b) {
+        return CompareNatural(a.name, b.name) < 0;
+      });
+    }
     for (const platform::FolderEntry& entry : *entries) {
       const std::string path = platform::JoinFolder(folder, entry.name);
+      const bool hidden = !options_.hidden && platform::IsHidden(path);
       if (entry.kind == platform::FileKind::Folder) {
-        if (recursive_ && !entry.link)
+        if (options_.recursive && !entry.link && !hidden)
           Descend(path, platform::JoinFolder(below, entry.name), depth + 1);
-      } else if (FindFormatByName(entry.name) != kNoFormat && IsFile(entry, path)) {
-        files_.push_back({path, below, Status::Ok, {}});
+      } else if (IsFile(entry, path)) {
+        AddFile(path, below, hidden);
       }
+    }
+  }
+
+  void AddFile(const std::string& path, const std::string& below, bool hidden) {
+    const int32_t format = FindFormatByName(path);
+    if (format == kNoFormat || !CanRead(FormatRow(format))) {
+      if (!hidden) leftOut_.Add(path);
+    } else if (hidden) {
+      leftOut_.AddHidden();
+    } else {
+      files_.push_back({path, below, Status::Ok, {}});
     }
   }
 
@@ -93,9 +118,10 @@ class Selector {
     trail_.erase(place);
   }
 
-  const bool recursive_;
+  const SelectionOptions& options_;
   std::set<std::pair<uint64_t, uint64_t>> trail_;  // the folder that is being read and its parents
   std::vector<SelectedFile> files_;
+  LeftOutFiles leftOut_;
 };
 
 }  // namespace
@@ -103,15 +129,20 @@ class Selector {
 void AddSelection(CLI::App& app, SelectionOptions& options, CommandContext& context) {
   context.names.Declare("FILE...", "Picture files, or folders of pictures", 0);
   AddFlag(app, "-r,--recursive", options.recursive, "Descend into subfolders");
+  AddFlag(app, "--hidden", options.hidden, "Include hidden files of folders");
+  AddChoice(app, "--sort", options.sort, "BY",
+            "Order: name (natural order), time (of modification), taken (EXIF date), size or none (default: files as named, those of folders by name)",
+            {"name", "time", "taken", "size", "none"});
+  AddFlag(app, "--reverse", options.reverse, "Reverse that order");
   AddName(app, "--files-from", options.filesFrom, "FILE|-",
           "Read names from a file, one per line; - is standard input");
   AddFlag(app, "-0,--null", options.zeroTerminated,
           "Names in that file are separated by NUL (find -print0)");
 }
 
-std::optional<std::vector<SelectedFile>> SelectFiles(const SelectionOptions& options,
-                                                     const CommandContext& context) {
-  Selector selector(options.recursive);
+std::optional<Selection> SelectFiles(const SelectionOptions& options,
+                                     const CommandContext& context) {
+  Selector selector(options);
   std::string list;
   if (options.filesFrom == "-") {
     if (!ReadStream(context.io.in, list)) {

@@ -16,18 +16,28 @@ using SelectedFile = BatchFile;
 // How the named files and folders become a selection.
 struct SelectionOptions {
   bool recursive = false;
+  bool hidden = false;
   std::string filesFrom;
   bool zeroTerminated = false;
+  std::string sort;  // empty: named files as named, folders in natural order
+  bool reverse = false;
+};
+
+// What a command line asks for.
+struct Selection {
+  std::vector<SelectedFile> files;
+  std::string leftOut;  // what was left out of folders, a sentence; empty if nothing was
 };
 
 // Declares the FILE... names of a command and the options that choose files.
 void AddSelection(CLI::App& app, SelectionOptions& options, CommandContext& context);
 
-// The files of a command line in order: files as named; for a folder, its files whose name selects
-// a format, in byte order (with `recursive` also those of subfolders, except behind links); then
-// the names read from a list. A missing file is in the result with its status. nullopt, after a
-// message, if nothing was named or the list cannot be read: a usage error.
-std::optional<std::vector<SelectedFile>> SelectFiles(const SelectionOptions& options,
-                                                     const CommandContext& context);
+// The files of a command line: files as named; for a folder, its files that this build can read, in
+// natural order (with `recursive` also those of subfolders, except behind links), hidden ones only
+// if asked for; then the names read from a list. `sort` and `reverse` are applied to all of them
+// together. A missing file is in the result with its status. nullopt, after a message, if nothing
+// was named or the list cannot be read: a usage error.
+std::optional<Selection> SelectFiles(const SelectionOptions& options,
+                                     const CommandContext& context);
 
 }  // namespace fotomill::cli

@@ -1,5 +1,7 @@
 #include "cli/frame/result_output.h"
 
+#include <utility>
+
 #include "batch/progress_model.h"
 #include "cli/frame/shown_text.h"
 #include "core/utf8.h"
@@ -140,6 +142,7 @@ void ResultOutput::EndArray() {
     Deliver(true);
   }
   ended_ = true;
+  if (!closing_.empty()) Note(std::exchange(closing_, {}));
 }
 
 // Earlier results are flushed first, so that both streams keep their order on one terminal.

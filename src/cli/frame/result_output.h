@@ -50,6 +50,8 @@ class ResultOutput {
   void Failure(std::string_view name, Status status, std::string_view hint = {});
   // A note on standard error, not a failure; suppressed by --quiet.
   void Note(std::string_view text);
+  // A note to be printed once after the last result.
+  void CloseWith(std::string note) { closing_ = std::move(note); }
   // A line on standard error.
   void Message(std::string_view text);
 
@@ -80,6 +82,7 @@ class ResultOutput {
   bool colored_;
   bool begun_ = false;  // the array has an element
   bool ended_ = false;
+  std::string closing_;
   std::chrono::steady_clock::time_point delivered_;
   TerminalProgress progress_;
   uint64_t expected_ = 0;

@@ -5,8 +5,7 @@
 
 #include "core/natural_order.h"
 #include "core/text.h"
-#include "metadata/exif/exif_source.h"
-#include "metadata/exif/exif_walk.h"
+#include "metadata/exif/taken_date.h"
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "registry/registry.h"
@@ -29,21 +28,6 @@ class FormatFinder {
 
  private:
   std::unordered_map<std::string, int32_t> rows_;
-};
-
-// Finds the date on which a picture was taken: "2004:08:31 22:32:08" becomes 20040831223208.
-class TakenDate : public ExifSink {
- public:
-  int64_t number = 0;
-  void Directory(int32_t, std::string_view) override {}
-  void Line(const ExifLine& line) override {
-    constexpr uint16_t kDateTimeOriginal = 0x9003;
-    if (line.value.tag != kDateTimeOriginal) return;
-    number = 0;
-    for (const char c : line.text.substr(0, 19)) {
-      if (c >= '0' && c <= '9') number = number * 10 + (c - '0');
-    }
-  }
 };
 
 }  // namespace
@@ -99,10 +83,7 @@ void AddPictureFacts(const std::string& folder, FolderItem& item) {
   item.width = picture->width;
   item.height = picture->height;
   item.bits = picture->bitsPerPixel;
-  ExifSource exif;
-  TakenDate date;
-  if (exif.Open(path.c_str()) == Status::Ok && WalkExif(exif.Block(), &date))
-    item.taken = date.number;
+  item.taken = TakenDate(path);
 }
 
 }  // namespace fotomill::desktop
