@@ -7,11 +7,11 @@
 
 #include "batch/new_job.h"
 #include "cli/frame/destination_format.h"
-#include "cli/frame/file_selection.h"
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
 #include "cli/frame/terminal_box.h"
 #include "cli/frame/terminal_prompts.h"
+#include "cli/selection/file_selection.h"
 #include "pages/catalogue_page.h"
 #include "platform/existence.h"
 #include "platform/files.h"

@@ -6,10 +6,10 @@
 #include <string>
 #include <vector>
 
-#include "cli/frame/file_selection.h"
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
 #include "cli/frame/used_files.h"
+#include "cli/selection/file_selection.h"
 #include "metadata/exif/exif_source.h"
 #include "metadata/exif/exif_text.h"
 #include "metadata/gps.h"

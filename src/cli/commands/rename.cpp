@@ -7,10 +7,10 @@
 
 #include "batch/new_job.h"
 #include "batch/sequential_rename.h"
-#include "cli/frame/file_selection.h"
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
 #include "cli/frame/terminal_box.h"
+#include "cli/selection/file_selection.h"
 #include "platform/folders.h"
 #include "texts/system_reason.h"
 #include "texts/texts.h"

@@ -10,10 +10,10 @@
 
 #include "batch/picture_failure.h"
 #include "catalog/thumbnails/thumbnail_file.h"
-#include "cli/frame/file_selection.h"
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
 #include "cli/frame/used_files.h"
+#include "cli/selection/file_selection.h"
 #include "core/workers/folder_scope.h"
 #include "core/workers/guarded.h"
 #include "core/workers/ordered_run.h"

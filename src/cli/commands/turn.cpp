@@ -6,10 +6,10 @@
 
 #include "batch/new_job.h"
 #include "batch/turn_run.h"
-#include "cli/frame/file_selection.h"
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
 #include "cli/frame/terminal_box.h"
+#include "cli/selection/file_selection.h"
 #include "platform/existence.h"
 #include "platform/files.h"
 #include "settings/settings.h"

@@ -4,10 +4,10 @@
 #include <string>
 
 #include "batch/picture_failure.h"
-#include "cli/frame/file_selection.h"
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
 #include "cli/frame/used_files.h"
+#include "cli/selection/file_selection.h"
 #include "registry/registry.h"
 #include "settings/job_options.h"
 #include "texts/texts.h"

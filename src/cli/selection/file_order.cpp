@@ -1,4 +1,4 @@
-#include "cli/frame/file_order.h"
+#include "cli/selection/file_order.h"
 
 #include <algorithm>
 #include <numeric>

@@ -1,4 +1,4 @@
-#include "cli/frame/left_out_files.h"
+#include "cli/selection/left_out_files.h"
 
 #include <algorithm>
 #include <utility>

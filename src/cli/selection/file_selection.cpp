@@ -1,11 +1,11 @@
-#include "cli/frame/file_selection.h"
+#include "cli/selection/file_selection.h"
 
 #include <algorithm>
 #include <set>
 #include <utility>
 
-#include "cli/frame/file_order.h"
-#include "cli/frame/left_out_files.h"
+#include "cli/selection/file_order.h"
+#include "cli/selection/left_out_files.h"
 #include "cli/frame/options.h"
 #include "core/limits.h"
 #include "core/natural_order.h"
