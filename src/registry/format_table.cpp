@@ -40,7 +40,7 @@ struct Place {
 // clang-format off
 constexpr Place kPlaces[] = {
     {"AVI", "(AVI) Video for Windows", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES},
-    {"BGA", "(BGA) OS/2 Warp", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_ALPHA},
+    {"BGA"},
     {"BMP"},
     {"CDR", "(CDR) Corel Draw Preview", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES},
     {"CUT", "(CUT) Dr. Halo", 1, 8, FMT_BITMAP},
@@ -66,7 +66,7 @@ constexpr Place kPlaces[] = {
     {"PNG"},
     {"PSD"},
     {"RAS"},
-    {"RLE", "(RLE) Windows", 1, 8, FMT_BITMAP},
+    {"RLE"},
     {"SCR", "(SCR) Windows Screen Saver", 1, 24, FMT_BITMAP},
     {"SGI"},
     {"SWF", "(SWF) Flash", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_TIMED | FMT_FRAMES | FMT_LAYERED | FMT_TRANSPARENT | FMT_FLASH},

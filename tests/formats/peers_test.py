@@ -25,7 +25,23 @@ ROWS = [
     ("iff", "bmp-16-colors.bmp", "ilbmtoppm"),
     ("lbm", "bmp-mono.bmp", "ilbmtoppm"),
     ("wbmp", "bmp-mono.bmp", "wbmptopbm"),
+    ("rle", "bmp-256-colors.bmp", "bmptopnm"),
+    ("rle", "bmp-16-colors.bmp", "bmptopnm"),
+    ("rle", "bmp-mono.bmp", "bmptopnm"),
+    ("bga", "bmp-true-color.bmp", "bmptopnm"),
+    ("bga", "bmp-256-colors.bmp", "bmptopnm"),
+    ("bga", "bmp-mono.bmp", "bmptopnm"),
 ]
+
+
+def bitmap_of_array(data):
+    """The only bitmap of an OS/2 array as a file of its own, which starts 14 bytes later."""
+    offset = int.from_bytes(data[24:28], "little") - 14
+    return data[14:24] + offset.to_bytes(4, "little") + data[28:]
+
+
+# What the peers read of a format that they do not know.
+INNER = {"bga": bitmap_of_array}
 
 
 def anymap(command, data):
@@ -54,6 +70,7 @@ def main():
             subprocess.run([FOTOMILL, "--quiet", "convert", source, "--to", extension, "--dest", folder, "--overwrite", "replace"],
                            check=True, stdout=subprocess.DEVNULL)
             made = (Path(folder) / source.stem).with_suffix("." + extension).read_bytes()
+            made = INNER.get(extension, bytes)(made)
             if anymap(command, made) != anymap("bmptopnm", source.read_bytes()):
                 print(f"{command} sees another picture in {sample} as {extension}")
                 failures += 1

@@ -49,6 +49,7 @@
 #include "core/byte_writer.h"
 #include "core/checked.h"
 #include "core/text.h"
+#include "formats/bmp/bmp_runs.h"
 #include "platform/file_view.h"
 #include "processing/pixel_rows.h"
 
@@ -293,83 +294,6 @@ Status ReadRowsConverted(platform::FileView& file, const BmpHeader& header,
   return file.Intact() ? Status::Ok : Status::FileReadError;
 }
 
-// Pixels of 8 bits: a run repeats one index, a literal holds one index a byte.
-struct Rle8 {
-  static constexpr uint64_t kPixelsPerByte = 1;
-  static void Run(uint8_t* row, uint64_t x, uint64_t count, uint8_t value) {
-    std::memset(row + x, value, count);
-  }
-  static void Literal(uint8_t* row, uint64_t x, uint64_t count, const uint8_t* data) {
-    std::memcpy(row + x, data, count);
-  }
-};
-
-// Pixels of 4 bits: a run alternates between the high and the low half of its value.
-struct Rle4 {
-  static constexpr uint64_t kPixelsPerByte = 2;
-  static void Put(uint8_t* row, uint64_t x, uint8_t half) {
-    uint8_t& place = row[x / 2];
-    place = static_cast<uint8_t>(x % 2 == 0 ? (place & 0x0F) | half << 4 : (place & 0xF0) | half);
-  }
-  static void Run(uint8_t* row, uint64_t x, uint64_t count, uint8_t value) {
-    for (uint64_t i = 0; i < count; ++i) Put(row, x + i, i % 2 == 0 ? value >> 4 : value & 0x0F);
-  }
-  static void Literal(uint8_t* row, uint64_t x, uint64_t count, const uint8_t* data) {
-    for (uint64_t i = 0; i < count; ++i)
-      Put(row, x + i, i % 2 == 0 ? data[i / 2] >> 4 : data[i / 2] & 0x0F);
-  }
-};
-
-// Decodes run-length data into the zero-filled rows of `image`, whatever its depth, as far as they
-// fit. Tokens:
-//
-//   n v            n pixels of value v
-//   0 0            end of line           0 1          end of bitmap
-//   0 2 dx dy      move right and up     0 n data...  n pixels as they stand (n from 3), padded to
-//   an even size
-//
-// FileReadError when the data end before an end of bitmap.
-template <typename Kind>
-Status DecodeRunLength(platform::FileView& file, const BmpHeader& header,
-                       const PictureRecord& picture, PackedImage& image) {
-  const int32_t height = image.Height();
-  const uint64_t limit = std::min<uint64_t>(header.width, image.Stride() * Kind::kPixelsPerByte);
-  ByteReader bytes(file.Bytes());
-  bytes.Seek(header.PixelOffset());
-  uint64_t x = 0, y = 0;
-  // How many of `count` pixels at (x, y) lie in the picture, and where the row begins.
-  const auto inside = [&](uint64_t count) {
-    return y < uint64_t(height) && x < limit ? std::min(count, limit - x) : 0;
-  };
-  const auto row = [&] {
-    return image.StoredRow(static_cast<int32_t>(header.TopDown() ? height - 1 - y : y)).data();
-  };
-  while (bytes.Left() >= 2) {
-    const uint8_t count = bytes.U8(), code = bytes.U8();
-    if (count > 0) {
-      if (const uint64_t visible = inside(count)) Kind::Run(row(), x, visible, code);
-      x += count;
-    } else if (code == 0) {
-      x = 0;
-      ++y;
-      file.DropBefore(bytes.Position());
-      RETURN_IF_BAD(picture.ReportRow(static_cast<int32_t>(std::min<uint64_t>(y, height))));
-    } else if (code == 1) {
-      return file.Intact() ? Status::Ok : Status::FileReadError;
-    } else if (code == 2) {
-      x += bytes.U8();
-      y += bytes.U8();
-    } else {
-      const uint64_t size = (code + 2 * Kind::kPixelsPerByte - 1) / (2 * Kind::kPixelsPerByte) * 2;
-      const std::span<const uint8_t> data = bytes.Take(size);
-      if (!bytes.Ok()) break;
-      if (const uint64_t visible = inside(code)) Kind::Literal(row(), x, visible, data.data());
-      x += code;
-    }
-  }
-  return Status::FileReadError;
-}
-
 // What the writer stores for a picture.
 struct BmpLayout {
   bool os2 = false;
@@ -508,10 +432,9 @@ Status BmpRead(PictureRecord& picture, const ReadRequest& request) {
     RETURN_IF_BAD(NewAlphaPlane(picture.width, picture.height, alpha));
   }
 
-  if (header.compression == kRle8) {
-    RETURN_IF_BAD(DecodeRunLength<Rle8>(file, header, picture, image));
-  } else if (header.compression == kRle4) {
-    RETURN_IF_BAD(DecodeRunLength<Rle4>(file, header, picture, image));
+  if (runLength) {
+    const BmpRuns runs{header.PixelOffset(), header.compression == kRle4, header.TopDown()};
+    RETURN_IF_BAD(DecodeBmpRuns(file, runs, picture, image));
   } else if (header.bits == image.Bits()) {
     RETURN_IF_BAD(ReadRowsUnchanged(file, header, picture, image));
   } else {
