@@ -1,6 +1,7 @@
 #include "batch/progress_box.h"
 
 #include "batch/job.h"
+#include "texts/status_text.h"
 #include "texts/texts.h"
 
 namespace fotomill {
@@ -61,7 +62,7 @@ std::string FileLine(const FileOutcome& outcome) {
   if (outcome.status == Status::Ok && !outcome.skipped)
     return outcome.source + " -> " + outcome.destination;
   std::string line = outcome.source + ": ";
-  if (!outcome.skipped) line += Tr(StatusMessage(outcome.status));
+  if (!outcome.skipped) line += StatusText(outcome.status);
   if (!outcome.hint.empty()) line += (outcome.skipped ? "" : " ") + outcome.hint;
   return line;
 }

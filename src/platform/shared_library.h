@@ -12,8 +12,8 @@ class SharedLibrary {
   SharedLibrary& operator=(SharedLibrary&& other) noexcept;
   ~SharedLibrary() { Unload(); }
 
-  // Loads a module by its absolute path; anything but a regular file is refused. False with
-  // `Error()` set.
+  // Loads a module by its absolute path; anything but a regular file is refused, and so is a file
+  // that ends before what its headers name. False with `Error()` set.
   [[nodiscard]] bool Load(const std::string& absolutePath);
   // Loads one of the system's own libraries by its bare name ("libjxr.so.0"), wherever the system
   // keeps them.

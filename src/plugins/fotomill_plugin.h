@@ -163,7 +163,9 @@ typedef int32_t(FMW_CALL* FMW_GET_PARAMS)(FMW_PLUGIN_PARAMS* params, int32_t zer
 typedef FMW_HANDLE(FMW_CALL* FMW_READ_IMAGE)(const char* fileName, int32_t* error,
                                              const FMW_HOST_SERVICES* services);
 /* PLUGIN11WriteImage: writes `bitmap` (a packed bitmap that stays the program's) and the comment,
- * when there is one, to a new file. After a failure the program deletes what is there. */
+ * when there is one, to a new file. It has the destination's name, in an empty folder of its own.
+ * PLUGIN11GetInfo is called for it next; a file that it does not recognize (except with the errors
+ * FMW_ERROR_UNSUPPORTED and FMW_ERROR_FORMAT) counts as not written. */
 typedef int32_t(FMW_CALL* FMW_WRITE_IMAGE)(const char* fileName, FMW_HANDLE bitmap,
                                            const char* comment, int32_t* error,
                                            const FMW_HOST_SERVICES* services);

@@ -2,7 +2,6 @@
 
 #include <algorithm>
 #include <cstddef>
-#include <mutex>
 #include <string>
 #include <vector>
 
@@ -10,7 +9,8 @@
 #include "platform/files.h"
 #include "platform/module_memory.h"
 #include "platform/paths.h"
-#include "platform/temporary_file.h"
+#include "platform/temporary_folder.h"
+#include "plugins/module_call.h"
 #include "plugins/plugin_bitmap.h"
 #include "plugins/plugin_table.h"
 #include "registry/registry.h"
@@ -18,12 +18,6 @@
 namespace fotomill {
 
 namespace {
-
-// Modules need not be re-entrant: one call at a time.
-std::recursive_mutex& CallMutex() {  // recursive: a module may load pictures through the program
-  static std::recursive_mutex mutex;
-  return mutex;
-}
 
 // What modules see of the settings.
 const FMW_CONFIG_ENTRY* configuration = nullptr;
@@ -38,6 +32,7 @@ thread_local const ReadOptions* currentOptions = nullptr;
 ReadOptions CurrentOptions() { return currentOptions == nullptr ? ReadOptions() : *currentOptions; }
 
 FMW_HANDLE FMW_CALL HostLoadPicture(const char* fileName, int32_t* error) {
+  const platform::OwnCode ownCode;
   PicturePointer picture;
   Status status = fileName == nullptr
                       ? Status::FileOpenError
@@ -65,11 +60,14 @@ void FMW_CALL HostSetStatus(const char* text) {
     progress->SetText(text);
 }
 
-// One call into a module: holds the mutex, names the picture, and carries the service block.
-class ModuleCall {
+// One call into a module about a picture: names it, and carries the service block.
+class PictureCall {
  public:
-  explicit ModuleCall(PictureRecord& picture, const ReadOptions* options = nullptr)
-      : lock_(CallMutex()), before_(currentPicture), optionsBefore_(currentOptions) {
+  PictureCall(const PluginEntry& entry, PictureRecord& picture,
+              const ReadOptions* options = nullptr)
+      : call_(std::string(entry.path.view()), ModuleStage::Working),
+        before_(currentPicture),
+        optionsBefore_(currentOptions) {
     currentPicture = &picture;
     currentOptions = options;
     services_.size = sizeof services_;
@@ -84,16 +82,16 @@ class ModuleCall {
     services_.configuration = configuration;
     services_.configurationCount = configurationCount;
   }
-  ~ModuleCall() {
+  ~PictureCall() {
     currentPicture = before_;
     currentOptions = optionsBefore_;
   }
-  ModuleCall(const ModuleCall&) = delete;
-  ModuleCall& operator=(const ModuleCall&) = delete;
+  PictureCall(const PictureCall&) = delete;
+  PictureCall& operator=(const PictureCall&) = delete;
   FMW_HOST_SERVICES* Services() { return &services_; }
 
  private:
-  std::lock_guard<std::recursive_mutex> lock_;
+  ModuleCall call_;
   PictureRecord* before_;
   const ReadOptions* optionsBefore_;
   FMW_HOST_SERVICES services_ = {};
@@ -139,13 +137,40 @@ Status CallWriter(const PluginEntry& entry, PictureRecord& picture, const std::s
   void* bitmap = NewModuleBitmap(picture.image, picture.alpha);
   if (bitmap == nullptr) return Status::MemoryAllocationError;
   int32_t error = 0;
-  ModuleCall call(picture);
+  PictureCall call(entry, picture);
   const int32_t written = entry.exports.writeImage(
       path.c_str(), bitmap, comment.empty() ? nullptr : comment.c_str(), &error, call.Services());
   platform::FreeModuleBlock(bitmap);
   if (written != 0) return Status::Ok;
   return error == 0 ? Status::ErrorWritingFile : static_cast<Status>(error);
 }
+
+// Where the module writes: in a folder of its own, under the destination's name, since some formats
+// keep their name inside. One that would be too long for a module's text is called "picture".
+std::string WorkingName(const std::string& folder, const std::string& destination) {
+  std::string path = platform::JoinFolder(folder, platform::FileNameOf(destination));
+  if (path.size() > PathText::Capacity()) {
+    path = platform::JoinFolder(
+        folder, std::string("picture").append(platform::SplitPath(destination).extension));
+  }
+  return path;
+}
+
+// Whether the module recognizes what it has written. One that only writes says that it cannot tell.
+bool ReadsBack(const PluginEntry& entry, const std::string& path) {
+  FMW_PICTURE_INFO info = {};
+  info.size = sizeof info;
+  info.version = FMW_PLUGIN_VERSION;
+  int32_t error = 0;
+  PictureRecord record;
+  PictureCall call(entry, record);
+  return entry.exports.getInfo(&info, path.c_str(), &error, call.Services()) != 0 ||
+         error == FMW_ERROR_UNSUPPORTED || error == FMW_ERROR_FORMAT;
+}
+
+// What a module may say about its formats; the other bits of a row are the program's own.
+constexpr uint32_t kModuleFlags = FMT_BITMAP | FMT_MULTI | FMT_ALPHA;
+constexpr uint32_t kMostBits = 24;  // of a picture without its alpha
 
 }  // namespace
 
@@ -157,20 +182,21 @@ Status PluginInfo(PictureRecord& picture, const ReadRequest& request) {
   info.version = FMW_PLUGIN_VERSION;
   info.frame = request.page;
   int32_t error = 0;
-  ModuleCall call(picture, &request.options);
+  PictureCall call(*entry, picture, &request.options);
   if (entry->exports.getInfo(&info, request.fileName.c_str(), &error, call.Services()) == 0)
     return ModuleError(error);
   picture.fileSize = platform::FactsOf(request.fileName).size;
-  return TakeInfo(info, picture);
+  RETURN_IF_BAD(TakeInfo(info, picture));
+  (void)PluginComment(picture, request.fileName.c_str());  // a picture does not fail for it
+  return Status::Ok;
 }
 
 Status PluginRead(PictureRecord& picture, const ReadRequest& request) {
   const PluginEntry* entry = FindPluginEntry(request.fileName);
   if (entry == nullptr || entry->exports.readImage == nullptr) return Status::UnsupportedFunction;
-  RETURN_IF_BAD(PluginComment(picture, request.fileName.c_str()));
   const std::string comment = CommentText(picture);
   int32_t error = 0;
-  ModuleCall call(picture, &request.options);
+  PictureCall call(*entry, picture, &request.options);
   call.Services()->comment = comment.empty() ? nullptr : comment.c_str();
   void* handle = entry->exports.readImage(request.fileName.c_str(), &error, call.Services());
   if (handle == nullptr) return ModuleError(error);
@@ -193,12 +219,13 @@ Status PluginWrite(PictureRecord& picture, const WriteOptions& options) {
   if (entry == nullptr || entry->exports.writeImage == nullptr) return Status::UnsupportedFunction;
   const std::string destination(picture.fileName.view());
   ByteWriter out;
-  platform::TemporaryFile working;  // of the same extension: a module may decide by it
-  if (!out.Create(destination)) return Status::ErrorCreatingFile;
-  if (!working.Create(platform::SplitPath(destination).extension)) return Status::ErrorCreatingFile;
-  RETURN_IF_BAD(CallWriter(*entry, picture, working.Path(), options.comment));
+  platform::TemporaryFolder folder;
+  if (!out.Create(destination) || !folder.Create()) return Status::ErrorCreatingFile;
+  const std::string working = WorkingName(folder.Path(), destination);
+  RETURN_IF_BAD(CallWriter(*entry, picture, working, options.comment));
+  if (!ReadsBack(*entry, working)) return Status::ErrorWritingFile;
   platform::FileView written;
-  if (!written.Open(working.Path())) return Status::ErrorWritingFile;
+  if (!written.Open(working) || written.Bytes().empty()) return Status::ErrorWritingFile;
   out.Bytes(written.Bytes());
   return written.Intact() ? CommitOutput(out, options) : Status::ErrorWritingFile;
 }
@@ -208,7 +235,7 @@ Status PluginComment(PictureRecord& picture, const char* fileName) {
   if (entry == nullptr) return Status::UnsupportedFunction;
   if (entry->exports.getComment == nullptr) return Status::Ok;
   int32_t error = 0;
-  ModuleCall call(picture);
+  PictureCall call(*entry, picture);
   void* handle = entry->exports.getComment(fileName, &error, 0);
   if (handle == nullptr) return Status::Ok;
   const auto block = platform::LockModuleBlock(handle);
@@ -235,11 +262,11 @@ int32_t BindPluginFormat(std::string_view fileName) {
   row.write = PluginWrite;
   row.canRead = row.canWrite = true;
   row.reserved = 0;
-  row.maxBits = entry->flags1;
+  row.maxBits = std::min(entry->flags1, kMostBits);
   row.extension = entry->extension;
   row.description = entry->textB;
   row.enabled = 1;
-  row.flags = entry->flags2;
+  row.flags = (entry->flags2 & kModuleFlags) | FMT_SPARE;
   return kSpareRow;
 }
 

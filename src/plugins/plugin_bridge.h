@@ -12,13 +12,16 @@ namespace fotomill {
 // another although both use the spare row. All answer UnsupportedFunction (5) when no module serves
 // the extension; a module's own error numbers are passed on.
 
-// Fills the facts. DamagedFile (2) when the module claims sizes or depths that no picture has.
+// Fills the facts and the comment. A comment that cannot be had is left out. DamagedFile (2) when
+// the module claims sizes or depths that no picture has.
 Status PluginInfo(PictureRecord& picture, const ReadRequest& request);
 // Decodes into `image`, and `alpha` for 32-bit bitmaps. DamagedFile (2) when the returned bitmap is
 // not what its header claims, MemoryAllocationError (6) when it cannot be locked or held.
 Status PluginRead(PictureRecord& picture, const ReadRequest& request);
-// Lets the module write a working file beside the destination, which then takes its name. Nothing
-// is left of a failed write. The comment goes along where the options say so.
+// Lets the module write a working file of the destination's name in a folder of its own, whose
+// contents then become the destination. ErrorWritingFile (11) when the module reports success
+// without a file that it can read itself. Nothing is left of a failed write. The comment goes along
+// where the options say so.
 Status PluginWrite(PictureRecord& picture, const WriteOptions& options);
 
 // Reads the comment inside a file into `picture.comment`. MemoryAllocationError (6) when the

@@ -32,6 +32,8 @@ std::vector<PluginFormatFacts> ListForRegistry() {
   std::vector<PluginFormatFacts> formats;
   for (int32_t i = 0; i < PluginFormatCount(); ++i) {
     const PluginEntry& entry = PluginRow(i);
+    // of two modules for one extension the first one serves it
+    if (i > 0 && EqualIgnoringCase(PluginRow(i - 1).extension, entry.extension)) continue;
     formats.push_back(
         {UpperCase(entry.extension.view()), std::string(entry.textB.view()), entry.flags1, entry.exports.writeImage != nullptr});
   }

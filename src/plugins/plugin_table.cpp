@@ -1,16 +1,20 @@
 #include "plugins/plugin_table.h"
 
 #include <algorithm>
+#include <map>
 #include <type_traits>
 #include <utility>
 #include <vector>
 
 #include "core/data_folder.h"
+#include "core/plain_name.h"
 #include "core/text.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
 #include "platform/shared_library.h"
+#include "plugins/bad_modules.h"
+#include "plugins/module_call.h"
 #include "registry/registry.h"
 
 namespace fotomill {
@@ -32,6 +36,12 @@ std::vector<LoadedEntry>& Table() {
 std::vector<std::string>& ModulesOff() {
   static std::vector<std::string> names;
   return names;
+}
+
+// Why the system did not load modules of the last scan, by path.
+std::map<std::string, std::string>& Unloadable() {
+  static std::map<std::string, std::string> reasons;
+  return reasons;
 }
 
 bool IsOn(std::string_view name) {
@@ -88,7 +98,11 @@ std::string_view ListItem(std::string_view list, int32_t index) {
 // Registers format number `index` of a module. False ends the module's registration.
 bool RegisterFormat(const std::string& path, int32_t index, std::vector<LoadedEntry>& table) {
   LoadedEntry loaded;
-  if (!loaded.library.Load(path) || !loaded.entry.path.Assign(path)) return false;
+  const ModuleCall call(path, ModuleStage::Loading);
+  if (!loaded.entry.path.Assign(path) || !loaded.library.Load(path)) {
+    Unloadable()[path] = loaded.library.Error();
+    return false;
+  }
   PluginEntry& entry = loaded.entry;
   entry.exports = LookUpExports(loaded.library);
   if (entry.exports.getParams == nullptr || entry.exports.readImage == nullptr ||
@@ -130,10 +144,15 @@ std::vector<std::string> PluginFolders() {
 
 int32_t ScanPlugins(const std::string& folder) {
   UnloadPlugins();
+  Unloadable().clear();
   std::vector<LoadedEntry> table;
   for (const PluginModule& module : PluginModules(folder)) {
     if (!module.on) continue;
     const std::string path = platform::JoinFolder(module.folder, module.name);
+    if (IsBadModule(path)) {
+      Unloadable()[path] = Tr("it ended the program when it was loaded");
+      continue;
+    }
     int32_t registered = 0;
     while (registered < kFormatsPerModule && RegisterFormat(path, registered, table)) ++registered;
   }
@@ -157,11 +176,17 @@ std::vector<PluginModule> PluginModules(const std::string& folder) {
   return modules;
 }
 
+std::string WhyNotLoaded(const std::string& path) {
+  const auto found = Unloadable().find(path);
+  return found == Unloadable().end() ? std::string() : found->second;
+}
+
 void SetModulesOff(std::vector<std::string> names) { ModulesOff() = std::move(names); }
 
 void SwitchModule(const std::string& name, bool on) {
   std::erase(ModulesOff(), name);
   if (!on) ModulesOff().push_back(name);
+  if (on) (void)ForgiveModule(name);
 }
 
 void UnloadPlugins() { Table().clear(); }
@@ -207,6 +232,7 @@ bool PluginCanHandle(std::string_view fileName) {
 bool ConfigurePlugin(int32_t index) {
   if (index < 0 || index >= PluginFormatCount() || PluginRow(index).exports.configure == nullptr)
     return false;
+  const ModuleCall call(std::string(PluginRow(index).path.view()), ModuleStage::Working);
   FMW_CONFIGURE block = {};
   block.size = sizeof block;
   block.version = FMW_PLUGIN_VERSION;
@@ -215,8 +241,9 @@ bool ConfigurePlugin(int32_t index) {
 
 std::string PluginHelpPage(int32_t index) {
   if (index < 0 || index >= PluginFormatCount()) return {};
-  const std::string folder = platform::JoinFolder(platform::ProgramFolder(), "html");
-  return platform::JoinFolder(folder, PluginRow(index).textA.view());
+  const std::string_view name = PluginRow(index).textA.view();
+  if (name.empty() || !IsPlainName(name)) return {};
+  return platform::JoinFolder(platform::JoinFolder(platform::ProgramFolder(), "html"), name);
 }
 
 }  // namespace fotomill

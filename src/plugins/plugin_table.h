@@ -56,9 +56,13 @@ struct PluginModule {
   bool on = true;
 };
 std::vector<PluginModule> PluginModules(const std::string& folder = {});
+// Why the last scan could not load a module, by its path; empty where it could.
+std::string WhyNotLoaded(const std::string& path);
 // The modules that are off, by file name; all others are on.
 void SetModulesOff(std::vector<std::string> names);
-void SwitchModule(const std::string& name, bool on);  // by file name; from the next scan on
+// By file name; from the next scan on. A module that is switched on is tried again even if it ended
+// the program the last time.
+void SwitchModule(const std::string& name, bool on);
 // Unloads every module; formats that are bound to a row must not be used afterwards.
 void UnloadPlugins();
 
@@ -87,6 +91,7 @@ bool ConfigurePlugin(int32_t index);
 inline constexpr std::string_view kNothingToConfigure =
     TrLater("No configuration items are available for the selected plugin.");
 // The help page of a module beneath the program's folder: "html\NAME", with the system's separator.
+// Empty for a module without a name, or with one that leads elsewhere.
 std::string PluginHelpPage(int32_t index);
 
 }  // namespace fotomill

@@ -2,6 +2,7 @@
  * A module that misbehaves in one way, chosen by a macro at build time; everything else about it is
  * in order. Its pictures are 2 x 1 of 24 bits, blue and red, whatever the file holds.
  */
+#include <signal.h>
 #include <stdio.h>
 #include <stdlib.h>
 #include <string.h>
@@ -18,7 +19,9 @@ FMW_EXPORT int32_t FMW_CALL PLUGIN11GetPluginParams(FMW_PLUGIN_PARAMS* params, i
   strcpy(params->extensions, "odd");
   params->flags1 = 24;
   params->flags2 = FMW_FORMAT_BITMAP;
-#if defined(GAPS_IN_LIST)
+#if defined(ALL_FLAGS)
+  params->flags1 = params->flags2 = 0xffffffff;
+#elif defined(GAPS_IN_LIST)
   strcpy(params->extensions, "abc;;def");
   params->flags2 |= FMW_FORMAT_MULTI;
 #elif defined(FORTY_FORMATS)
@@ -55,6 +58,15 @@ FMW_EXPORT int32_t FMW_CALL PLUGIN11GetInfo(FMW_PICTURE_INFO* info, const char* 
 #elif defined(ERROR_NUMBER)
   *error = 25;
   return 0;
+#elif defined(ERROR_42)
+  *error = 42;
+  return 0;
+#elif defined(BLIND_WRITER)
+  FILE* file = fopen(fileName, "rb");
+  const int bad = fgetc(file) != 'o';
+  fclose(file);
+  *error = FMW_ERROR_DAMAGED;
+  if (bad) return 0;
 #endif
   (void)error;
   return services->size == (int32_t)sizeof *services && memcmp(services->mark, "RXaR", 4) == 0 &&
@@ -66,6 +78,11 @@ FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN11ReadImage(const char* fileName, int32_t* 
                                                  const FMW_HOST_SERVICES* services) {
   static const uint8_t rowBytes[] = {255, 0, 0, 0, 0, 255, 0, 0};
   uint8_t* block = calloc(1, 48);
+#if defined(EXITS)
+  if (strstr(fileName, "last") != 0) exit(0);
+#elif defined(CRASHES)
+  if (strstr(fileName, "last") != 0) raise(SIGSEGV);
+#endif
   (void)fileName;
   (void)error;
   (void)services;
@@ -94,6 +111,45 @@ FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN11ReadImage(const char* fileName, int32_t* 
 #endif
   return block;
 }
+
+#if defined(EXITS_AT_ONCE)
+__attribute__((constructor)) static void Leave(void) { exit(0); }
+#endif
+
+#if defined(COMMENTS)
+FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN11GetComment(const char* fileName, int32_t* error,
+                                                  int32_t zero) {
+  (void)fileName;
+  (void)error;
+  (void)zero;
+  return strdup("said by the module");
+}
+#endif
+
+#if defined(LAZY_WRITER) || defined(EMPTY_WRITER) || defined(NAME_WRITER) || \
+    defined(BLIND_WRITER) || defined(ALL_FLAGS)
+/* Reports success, whatever it has written. */
+FMW_EXPORT int32_t FMW_CALL PLUGIN11WriteImage(const char* fileName, FMW_HANDLE bitmap,
+                                               const char* comment, int32_t* error,
+                                               const FMW_HOST_SERVICES* services) {
+  (void)fileName;
+  (void)bitmap;
+  (void)comment;
+  (void)error;
+  (void)services;
+#if !defined(LAZY_WRITER)
+  FILE* file = fopen(fileName, "wbx"); /* there must be no such file */
+  if (file == 0) return 0;
+#if defined(NAME_WRITER)
+  fputs(strrchr(fileName, '/') + 1, file);
+#elif defined(BLIND_WRITER)
+  fputs("no such picture", file);
+#endif
+  fclose(file);
+#endif
+  return 1;
+}
+#endif
 
 #if defined(HALF_WRITER) || defined(SILENT_WRITER)
 FMW_EXPORT int32_t FMW_CALL PLUGIN11WriteImage(const char* fileName, FMW_HANDLE bitmap,

@@ -1,9 +1,12 @@
 #include <gtest/gtest.h>
 
+#include <cstdlib>
 #include <filesystem>
 
 #include "core/data_folder.h"
+#include "platform/fault.h"
 #include "platform/paths.h"
+#include "platform/process.h"
 #include "plugins/plugin_bridge.h"
 #include "plugins/plugin_table.h"
 #include "registry/registry.h"
@@ -12,6 +15,7 @@
 #include "settings/settings.h"
 #include "support/files.h"
 #include "support/scoped_settings.h"
+#include "texts/status_text.h"
 
 namespace fotomill {
 namespace {
@@ -56,6 +60,8 @@ TEST_F(Plugins, TextsWithoutEndAreCut) {
   EXPECT_EQ(a, std::string(260, 'A'));
   EXPECT_EQ(b, std::string(260, 'B'));
   EXPECT_FALSE(PluginTextA(1, a));
+  EXPECT_TRUE(PluginHelpPage(0).ends_with("/html/" + a));
+  EXPECT_EQ(PluginHelpPage(1), "");
 }
 
 TEST_F(Plugins, OnlyModulesByNameAreLoaded) {
@@ -124,19 +130,102 @@ TEST_F(Plugins, AFailedWriteLeavesTheDestinationAlone) {
     Status status;
   };
   for (const Row& row : {Row{"HALF_WRITER", Status::ErrorCreatingFile},
-                         {"SILENT_WRITER", Status::ErrorWritingFile}}) {
+                         {"SILENT_WRITER", Status::ErrorWritingFile},
+                         {"LAZY_WRITER", Status::ErrorWritingFile},
+                         {"EMPTY_WRITER", Status::ErrorWritingFile},
+                         {"BLIND_WRITER", Status::ErrorWritingFile}}) {
     SCOPED_TRACE(row.module);
     EnablePlugins(OddFolder(row.module));
     const std::string file = folder_.Path("x.odd");
-    test::WriteText(file, "before");
+    test::WriteText(file, "on before");
     PicturePointer picture;
     ASSERT_EQ(LoadPicture({.fileName = file}, picture), Status::Ok);
     EXPECT_EQ(picture->typeName.view(), std::string(64, 'T'));
     EXPECT_EQ(picture->image.PixelAt(0, 0), 0x0000ff);
     EXPECT_EQ(picture->image.PixelAt(1, 0), 0xff0000);
     EXPECT_EQ(WritePicture(*picture, file, {}), row.status);
-    EXPECT_EQ(test::ReadText(file), "before");
+    EXPECT_EQ(test::ReadText(file), "on before");
     EXPECT_EQ(folder_.Names(), std::vector<std::string>{"x.odd"});
+  }
+}
+
+TEST_F(Plugins, AWriterGetsTheDestinationsName) {
+  test::TemporaryFolder temporary;
+  const char* const before = std::getenv("TMPDIR");
+  const std::string kept = before == nullptr ? "/tmp" : before;
+  platform::SetVariable("TMPDIR", temporary.Path());
+  EnablePlugins(OddFolder("NAME_WRITER"));
+  test::WriteText(folder_.Path("x.odd"), "");
+  PicturePointer picture;
+  ASSERT_EQ(LoadPicture({.fileName = folder_.Path("x.odd")}, picture), Status::Ok);
+  // the working folder has a longer path than the destination's
+  const std::string longest = std::string(255 - folder_.Path("x").size(), 'n') + ".odd";
+  for (const std::string& name : {std::string("holiday in May.odd"), longest}) {
+    ASSERT_EQ(WritePicture(*picture, folder_.Path(name), {}), Status::Ok);
+    EXPECT_EQ(test::ReadText(folder_.Path(name)), name == longest ? "picture.odd" : name);
+  }
+  EXPECT_EQ(temporary.Names(), std::vector<std::string>());
+  platform::SetVariable("TMPDIR", kept);
+}
+
+TEST_F(Plugins, ErrorNumbersAreNamed) {
+  EnablePlugins(OddFolder("ERROR_42"));
+  test::WriteText(folder_.Path("x.odd"), "");
+  PicturePointer picture;
+  const Status status = LoadPicture({.fileName = folder_.Path("x.odd")}, picture);
+  EXPECT_EQ(StatusNumber(status), 42);
+  EXPECT_EQ(StatusText(status), "error 42 of the plug-in");
+  EXPECT_EQ(EnglishStatusText(static_cast<Status>(-1)), "error -1 of the plug-in");
+  EXPECT_EQ(StatusText(Status::DamagedFile), "Damaged file.");
+}
+
+TEST_F(Plugins, FlagsOfTheProgramStayTheProgramsOwn) {
+  EnablePlugins(OddFolder("ALL_FLAGS"));
+  ASSERT_EQ(FindFormatByName("x.odd"), kSpareRow);
+  const FormatEntry& row = FormatRow(kSpareRow);
+  EXPECT_EQ(row.flags, FMT_SPARE | FMT_BITMAP | FMT_MULTI | FMT_ALPHA);
+  EXPECT_EQ(row.maxBits, 24u);
+  EXPECT_EQ(PluginRow(0).flags2, 0xffffffffu);
+}
+
+TEST_F(Plugins, CommentsComeWithTheFacts) {
+  EnablePlugins(OddFolder("COMMENTS"));
+  const std::string file = folder_.Path("x.odd");
+  test::WriteText(file, "");
+  PicturePointer picture;
+  ASSERT_EQ(LoadPictureInfo({.fileName = file}, picture), Status::Ok);
+  EXPECT_EQ(std::string(picture->comment.begin(), picture->comment.end()), "said by the module");
+  bool withoutComment = false;
+  for (int64_t n = 1; n < 100; ++n) {
+    platform::faultCountdown = n;
+    const Status status = LoadPictureInfo({.fileName = file}, picture);
+    const bool reached = platform::faultCountdown <= 0;
+    platform::faultCountdown = 0;
+    if (!reached) break;
+    withoutComment = withoutComment || (status == Status::Ok && picture->comment.empty());
+  }
+  EXPECT_TRUE(withoutComment) << "a comment that cannot be locked is not the picture's fault";
+}
+
+TEST_F(Plugins, AnExtensionOfTwoModulesIsListedOnce) {
+  for (const char* name : {"FMWPL_a.so", "FMWPL_b.so"})
+    std::filesystem::copy_file(OddFolder("GAPS_IN_LIST") + "/FMWPL_odd.so", folder_.Path(name));
+  EnablePlugins(folder_.Path());
+  ASSERT_EQ(PluginFormats().size(), 2u);
+  EXPECT_EQ(PluginFormats()[0].extension, "ABC");
+  EXPECT_EQ(PluginFormats()[1].extension, "DEF");
+  EXPECT_EQ(PluginFormatCount(), 4);
+}
+
+TEST_F(Plugins, AModuleThatIsCutOffIsSkipped) {
+  const std::string whole = OddFolder("GAPS_IN_LIST") + "/FMWPL_odd.so";
+  const auto size = std::filesystem::file_size(whole);
+  const std::string copy = folder_.Path("FMWPL_odd.so");
+  std::filesystem::copy_file(whole, copy);
+  for (auto end = size - 1; end > 0; end -= std::min(end, size / 40)) {
+    std::filesystem::resize_file(copy, end);
+    ASSERT_EQ(ScanPlugins(folder_.Path()), 0) << end << " of " << size;
+    ASSERT_FALSE(WhyNotLoaded(copy).empty());
   }
 }
 

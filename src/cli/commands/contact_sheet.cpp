@@ -16,6 +16,7 @@
 #include "platform/existence.h"
 #include "platform/files.h"
 #include "settings/settings.h"
+#include "texts/status_text.h"
 #include "texts/texts.h"
 
 namespace fotomill::cli {
@@ -117,7 +118,7 @@ int RunSheet(const SheetOptions& options, const CommandContext& context) {
   if (const Status status = RunContactSheet(selection->files, sheet, job); status != Status::Ok) {
     const std::string hint =
         status == Status::ResourceError ? std::string(" ") + Tr(kNoFont) : std::string();
-    output.Message(output.ShownMessage(options.dest) + ": " + Tr(StatusMessage(status)) + hint);
+    output.Message(output.ShownMessage(options.dest) + ": " + StatusText(status) + hint);
     return kExitFailed;
   }
   return FinishBatch(job);

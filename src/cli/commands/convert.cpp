@@ -20,6 +20,7 @@
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "settings/settings.h"
+#include "texts/status_text.h"
 #include "texts/texts.h"
 
 namespace fotomill::cli {
@@ -177,7 +178,7 @@ int RunConvert(const ConvertOptions& options, const CommandContext& context) {
   TerminalBox box(output, options.verbose, options.overwrite.empty() && !job.overwrite.prompt);
   job.box = &box;
   if (const Status status = RunBatch(selection->files, function, job); status != Status::Ok) {
-    output.Message(output.ShownMessage(options.dest) + ": " + Tr(StatusMessage(status)));
+    output.Message(output.ShownMessage(options.dest) + ": " + StatusText(status));
     return kExitFailed;
   }
   return FinishBatch(job);

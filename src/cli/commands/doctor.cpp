@@ -83,11 +83,14 @@ void ReportPlugins(ResultOutput& output, bool enabled) {
   for (const auto& [path, list] : formats)
     Report(output, "  " + EscapeControls(platform::FileNameOf(path)), list);
   for (const PluginModule& module : PluginModules()) {
+    const std::string path = platform::JoinFolder(module.folder, module.name);
     if (!module.on) {
       Report(output, "  " + EscapeControls(module.name), Tr("disabled"));
-    } else if (!IsRegistered(platform::JoinFolder(module.folder, module.name))) {
+    } else if (!IsRegistered(path)) {
+      const std::string reason = WhyNotLoaded(path);
       Report(output, "  " + EscapeControls(module.name),
-             Tr("not used: not a module for this system, or it failed to start"));
+             reason.empty() ? Tr("not used: not a module for this system, or it failed to start")
+                            : Tr("not used: %1", reason));
     }
   }
 }

@@ -10,6 +10,7 @@
 #include "cli/selection/file_selection.h"
 #include "registry/registry.h"
 #include "settings/job_options.h"
+#include "texts/status_text.h"
 #include "texts/texts.h"
 
 namespace fotomill::cli {
@@ -76,7 +77,7 @@ int RunVerify(const VerifyOptions& options, const CommandContext& context) {
     }
     output.CountFile();
     used.Add(file.name);
-    if (!output.IsJson()) output.Line(output.Shown(file.name) + ": " + Tr(StatusMessage(status)));
+    if (!output.IsJson()) output.Line(output.Shown(file.name) + ": " + StatusText(status));
     if (options.verbose && !note.empty())
       output.Note(output.Shown(file.name) + ": " + output.Shown(note));
   }

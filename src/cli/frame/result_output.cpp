@@ -6,6 +6,7 @@
 #include "cli/frame/shown_text.h"
 #include "core/utf8.h"
 #include "platform/process.h"
+#include "texts/status_text.h"
 #include "texts/texts.h"
 
 namespace fotomill::cli {
@@ -51,7 +52,7 @@ void PutName(Json& object, const std::string& key, std::string_view name) {
 
 void PutStatus(Json& object, Status status) {
   object["status"] = StatusNumber(status);
-  object["message"] = StatusMessage(status);
+  object["message"] = EnglishStatusText(status);
 }
 
 ResultOutput::ResultOutput(const CommandContext& context, bool json)
@@ -112,7 +113,7 @@ void ResultOutput::Failure(std::string_view name, Status status, std::string_vie
   ++failures_;
   std::string text = ShownMessage(name) + ": ";
   if (colored_) text += kRed;
-  text += Tr(StatusMessage(status));
+  text += StatusText(status);
   if (colored_) text += kPlain;
   if (!hint.empty()) text += " " + ShownMessage(hint);
   Message(text);

@@ -10,7 +10,7 @@
 namespace fotomill::platform {
 
 std::span<uint8_t> LockModuleBlock(void* handle) {
-  if (handle == nullptr) return {};
+  if (handle == nullptr || FaultDue()) return {};
   return {static_cast<uint8_t*>(handle), malloc_usable_size(handle)};
 }
 

@@ -9,10 +9,12 @@
 
 #include <cerrno>
 #include <cstdio>
+#include <filesystem>
 #include <memory>
 #include <mutex>
 #include <set>
 #include <string_view>
+#include <system_error>
 
 #include "platform/paths.h"
 #include "platform/posix/handle.h"
@@ -41,6 +43,16 @@ bool IsOfEndedProcess(const char* name) {
          kill(static_cast<pid_t>(process), 0) != 0 && errno == ESRCH;
 }
 
+// Deletes a temporary folder of this user, with all that is in it. False if `path` is none.
+bool DeletedFolder(const std::string& path) {
+  struct stat facts;
+  if (lstat(path.c_str(), &facts) != 0 || !S_ISDIR(facts.st_mode) || facts.st_uid != geteuid())
+    return false;
+  std::error_code ignored;
+  std::filesystem::remove_all(path, ignored);
+  return true;
+}
+
 }  // namespace
 
 std::string OwnerOfTemporary() {
@@ -66,6 +78,7 @@ void DeleteStaleFiles(const std::string& folder) {
       continue;
     struct stat facts;
     const std::string path = JoinFolder(folder, name);
+    if (name.starts_with("FMWT") && DeletedFolder(path)) continue;
     const Handle file = OpenRegular(path.c_str(), O_RDONLY | O_NOFOLLOW, facts);
     if (!file.IsOpen() || facts.st_uid != geteuid() || flock(file.Number(), LOCK_EX | LOCK_NB) != 0)
       continue;

@@ -10,6 +10,7 @@
 #include "platform/paths.h"
 #include "registry/registry.h"
 #include "settings/job_options.h"
+#include "texts/status_text.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -32,7 +33,7 @@ void AddHeaderLines(const std::string& path, Status known, std::vector<std::stri
   const Status status =
       LoadPictureInfo({.fileName = path, .options = ReadOptionsFromSettings()}, picture);
   const Status problem = status != Status::Ok ? status : known;
-  if (problem != Status::Ok) lines.push_back(Tr(StatusMessage(problem)));
+  if (problem != Status::Ok) lines.push_back(StatusText(problem));
   if (status != Status::Ok) return;
   std::string facts =
       Tr("%1 x %2 pixels, %3 bits", picture->width, picture->height, picture->bitsPerPixel);

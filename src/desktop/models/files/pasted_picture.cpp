@@ -13,6 +13,7 @@
 #include "registry/registry.h"
 #include "settings/job_options.h"
 #include "settings/settings.h"
+#include "texts/status_text.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -73,7 +74,7 @@ FileOperationResult KeepPastedPicture(const PastedPicture& pasted, const std::st
   if (status == Status::Ok) {
     result.done.steps.push_back({path, path});
   } else {
-    result.failures.push_back({path.empty() ? folder : path, Tr(StatusMessage(status))});
+    result.failures.push_back({path.empty() ? folder : path, StatusText(status)});
   }
   return result;
 }

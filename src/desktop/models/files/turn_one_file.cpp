@@ -6,6 +6,7 @@
 #include "platform/files.h"
 #include "settings/job_options.h"
 #include "settings/settings.h"
+#include "texts/status_text.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -27,8 +28,7 @@ FileOperationResult TurnOneFile(const std::string& path, Orientation turn) {
     const std::string hint =
         kept ? turned.hint
              : std::string(Tr("There is not enough disk space to keep the old file for undo."));
-    result.failures.push_back(
-        {path, Tr(StatusMessage(turned.status)) + (hint.empty() ? "" : " ") + hint});
+    result.failures.push_back({path, StatusText(turned.status) + (hint.empty() ? "" : " ") + hint});
   }
   return result;
 }

@@ -4,6 +4,7 @@
 #include "core/shown_text.h"
 #include "metadata/exif/exif_source.h"
 #include "metadata/exif/exif_tags.h"
+#include "texts/status_text.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -51,7 +52,7 @@ ExifReport ReadExifReport(const std::string& path, const ExifTextOptions& option
   ExifSource source;
   report.status = source.Open(path.c_str());
   if (report.status != Status::Ok) {
-    report.problem = Tr(StatusMessage(report.status));
+    report.problem = StatusText(report.status);
     return report;
   }
   if (source.Block().empty()) {

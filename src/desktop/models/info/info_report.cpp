@@ -16,6 +16,7 @@
 #include "registry/registry.h"
 #include "settings/job_options.h"
 #include "settings/settings.h"
+#include "texts/status_text.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -127,8 +128,7 @@ void AddExif(const std::string& path, const InfoOptions& options, FileInfo& info
 
 std::string ProblemOf(const std::string& path, Status status) {
   const std::string hint = OpenHint(path, status);
-  return hint.empty() ? Tr(StatusMessage(status))
-                      : Tr(StatusMessage(status)).append(" ").append(hint);
+  return hint.empty() ? StatusText(status) : StatusText(status).append(" ").append(hint);
 }
 
 // How a value differs: every different one with the number of files that have it, the most frequent

@@ -8,6 +8,7 @@
 #include "platform/paths.h"
 #include "platform/volumes.h"
 #include "registry/registry.h"
+#include "texts/status_text.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -36,10 +37,10 @@ std::string OutcomeText(Compacted result, int32_t before, int32_t after, uint64_
                      SizeText(saved, choice::kSizeFitting));
     case Compacted::Stopped: return std::string(Tr("Stopped.")).append(" ").append(Tr(kUnchanged));
     case Compacted::NotRead:
-      return Tr(StatusMessage(Status::FileReadError)).append(" ").append(Tr(kUnchanged));
+      return StatusText(Status::FileReadError).append(" ").append(Tr(kUnchanged));
     case Compacted::Failed: break;
   }
-  return Tr(StatusMessage(Status::ErrorWritingFile))
+  return StatusText(Status::ErrorWritingFile)
       .append(" ")
       .append(Tr(kUnchanged))
       .append(" ")
@@ -71,7 +72,7 @@ void CollectOrphans(const std::string& folder, int depth, const StopToken& stop,
 DatabaseCompaction::DatabaseCompaction(std::string path, bool purge, bool hidden)
     : path_(std::move(path)), hidden_(hidden) {
   const auto ended = [this](Status status) {
-    if (status != Status::Ok) outcome_ = Tr(StatusMessage(status));
+    if (status != Status::Ok) outcome_ = StatusText(status);
     ended_ = true;
   };
   task_.Start(

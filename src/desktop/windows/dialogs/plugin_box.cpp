@@ -9,8 +9,10 @@
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/widgets/looks.h"
 #include "desktop/windows/widgets/wx_text.h"
+#include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
+#include "platform/process.h"
 #include "plugins/plugin_table.h"
 #include "registry/registry.h"
 #include "settings/plugin_settings.h"
@@ -52,6 +54,7 @@ PluginBox::PluginBox(wxWindow* parent)
                            Label("Changes take effect at the next start of the program."));
   auto* buttons = new wxBoxSizer(wxHORIZONTAL);
   buttons->Add(new wxButton(this, wxID_PREFERENCES, Label("&Configure...")));
+  buttons->Add(new wxButton(this, wxID_HELP, Label("&Help")), wxSizerFlags().Border(wxLEFT, gap));
   buttons->AddStretchSpacer();
   buttons->Add(new wxButton(this, wxID_CANCEL, Label("Close")));
   auto* column = new wxBoxSizer(wxVERTICAL);
@@ -62,6 +65,8 @@ PluginBox::PluginBox(wxWindow* parent)
   SetSizerAndFit(column);
   Bind(
       wxEVT_BUTTON, [this](wxCommandEvent&) { Configure(); }, wxID_PREFERENCES);
+  Bind(
+      wxEVT_BUTTON, [this](wxCommandEvent&) { OpenHelp(); }, wxID_HELP);
   list_->Bind(wxEVT_DATAVIEW_ITEM_VALUE_CHANGED,
               [this](wxDataViewEvent& event) { Turn(list_->ItemToRow(event.GetItem())); });
   list_->Bind(wxEVT_CHAR_HOOK, [this](wxKeyEvent& event) {
@@ -87,6 +92,7 @@ void PluginBox::FillList() {
   }
   if (selected != wxNOT_FOUND) list_->SetCurrentItem(list_->RowToItem(selected));
   FindWindow(wxID_PREFERENCES)->Enable(PluginFormatCount() > 0);
+  FindWindow(wxID_HELP)->Enable(PluginFormatCount() > 0);
   LogEvent("plugins", "lines=" + std::to_string(lines_.size()) +
                           " formats=" + std::to_string(PluginFormatCount()));
 }
@@ -137,6 +143,18 @@ void PluginBox::Configure() {
   const int32_t row = lines_[static_cast<size_t>(line)].row;
   if (row < 0 || !ConfigurePluginRow(row))
     wxMessageBox(Label(kNothingToConfigure.data()), Label(kTitle), wxOK | wxICON_INFORMATION, this);
+}
+
+void PluginBox::OpenHelp() {
+  const int line = list_->GetSelectedRow();
+  if (line == wxNOT_FOUND) return;
+  const std::string page = PluginHelpPage(lines_[static_cast<size_t>(line)].row);
+  const bool opened = platform::IsRegularFile(page) &&
+                      platform::RunProgram(platform::ProgramFor(page), /*wait=*/false);
+  LogEvent("plugins", "help " + page + (opened ? "" : ": none"));
+  if (!opened)
+    wxMessageBox(Label("This plug-in has no help page."), Label(kTitle), wxOK | wxICON_INFORMATION,
+                 this);
 }
 
 }  // namespace fotomill::desktop

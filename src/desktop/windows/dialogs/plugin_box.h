@@ -23,6 +23,7 @@ class PluginBox : public wxDialog {
   void AddModule(const PluginModule& module);
   void Turn(int line);
   void Configure();
+  void OpenHelp();
 
   wxDataViewListCtrl* list_ = nullptr;
   struct Line {

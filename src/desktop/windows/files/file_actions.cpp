@@ -12,8 +12,8 @@
 #include <memory>
 
 #include "core/plain_name.h"
-#include "desktop/models/files/pasted_picture.h"
 #include "desktop/models/files/operation_options.h"
+#include "desktop/models/files/pasted_picture.h"
 #include "desktop/models/files/turn_one_file.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/dialogs/folder_dialog.h"
@@ -25,6 +25,7 @@
 #include "platform/paths.h"
 #include "settings/history_list.h"
 #include "settings/settings.h"
+#include "texts/status_text.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -68,7 +69,7 @@ void FileActions::Run(const std::string& what, Work work, Then then) {
     return Status::Ok;
   };
   task_.Start(Lane::Blocking, run, [this, what, result, then = std::move(then)](Status status) {
-    if (status != Status::Ok) result->failures.push_back({what, Tr(StatusMessage(status))});
+    if (status != Status::Ok) result->failures.push_back({what, StatusText(status)});
     CallAfter([this, what, result, then] { Finished(what, std::move(*result), then); });
   });
 }

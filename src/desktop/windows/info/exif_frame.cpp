@@ -19,6 +19,7 @@
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "settings/job_options.h"
+#include "texts/status_text.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -75,7 +76,7 @@ ExifFrame::ExifFrame(wxWindow* parent, const std::string& path)
         report_ = ReadExifReport(path_, options);
       },
       [this](Status status) {
-        if (status != Status::Ok) report_.problem = Tr(StatusMessage(status));
+        if (status != Status::Ok) report_.problem = StatusText(status);
         Finished();
       });
 }

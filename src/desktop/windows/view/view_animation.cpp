@@ -11,6 +11,7 @@
 #include "desktop/windows/view/system_animations.h"
 #include "platform/clock.h"
 #include "registry/registry.h"
+#include "texts/status_text.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -127,7 +128,7 @@ std::string ViewAnimation::StatusText() const {
   std::string text = "animation";
   if (player_->Count() > 0) text = Tr("frame %1 of %2", player_->Frame() + 1, player_->Count());
   if (player_->Count() > 0 && !player_->Playing()) text += std::string(", ") + Tr("paused");
-  if (player_->Failure() != Status::Ok) text += ", " + Tr(StatusMessage(player_->Failure()));
+  if (player_->Failure() != Status::Ok) text += ", " + fotomill::StatusText(player_->Failure());
   return text;
 }
 

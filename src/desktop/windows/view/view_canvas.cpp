@@ -15,6 +15,7 @@
 #include "platform/paths.h"
 #include "processing/geometry/scale.h"
 #include "settings/settings.h"
+#include "texts/status_text.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -224,8 +225,8 @@ void ViewCanvas::PaintMessage(wxDC& dc) const {
   const Shade text = Readable({0, 0, 0}, {around.Red(), around.Green(), around.Blue()});
   dc.SetTextForeground(wxColour(text.red, text.green, text.blue));
   const std::string name(platform::FileNameOf(picture_->request.path));
-  dc.DrawLabel(Shown(name) + "\n" + Shown(Tr(StatusMessage(picture_->status))),
-               wxRect(GetClientSize()), wxALIGN_CENTER);
+  dc.DrawLabel(Shown(name) + "\n" + Shown(StatusText(picture_->status)), wxRect(GetClientSize()),
+               wxALIGN_CENTER);
 }
 
 void ViewCanvas::PaintOverlay(wxDC& dc) const {

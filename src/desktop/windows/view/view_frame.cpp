@@ -24,6 +24,7 @@
 #include "platform/paths.h"
 #include "settings/configuration.h"
 #include "settings/settings.h"
+#include "texts/status_text.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -274,7 +275,7 @@ std::string ViewFrame::StatusLine() const {
   std::string line = Tr("%1 of %2", place_ + 1, ThousandsText(list_.size()));
   const ViewPicturePointer& shown = canvas_->Picture();
   if (!IsCurrent(shown)) return line + ", " + Tr("loading...");
-  if (shown->picture == nullptr) return line + ", " + Tr(StatusMessage(shown->status));
+  if (shown->picture == nullptr) return line + ", " + StatusText(shown->status);
   const PictureRecord& picture = *shown->picture;
   line += ", " + SizeAndZoom(picture, canvas_->Zoom());
   if (turn_ != Orientation::Upright) line += std::string(", ") + Tr("rotated, not saved");
