@@ -99,6 +99,8 @@ struct BatchJob {
   // FileHistoryFunctions: a bit for each function whose files are recorded
   uint32_t historyFunctions = ~0u;
   bool writeComments = false;       // into files of plug-in formats
+  // ExifAdjustOrientation: pictures are turned where their orientation tag gets lost
+  bool turnsUpright = true;
   // Keeps a value permanently. Called on the thread that runs the batch; none: nothing is kept.
   std::function<void(Remembered what, int32_t value)> remember = {};
   ProgressModel progress;

@@ -65,6 +65,7 @@ BatchJob NewBatchJob() {
   job.boxSettings = ProgressSettingsFromSettings();
   job.historyFunctions = static_cast<uint32_t>(settings.FileHistoryFunctions);
   job.writeComments = WritesCommentsFromSettings();
+  job.turnsUpright = settings.ExifAdjustOrientation != 0;
   job.remember = StoreRemembered;
   return job;
 }

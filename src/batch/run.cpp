@@ -5,6 +5,7 @@
 #include <optional>
 
 #include "batch/destination_name.h"
+#include "batch/output_writer.h"
 #include "batch/picture_failure.h"
 #include "batch/prompts.h"
 #include "batch/reported_run.h"
@@ -56,6 +57,7 @@ class Batch {
         asksEveryName_(AsksEveryName(job)),
         outputs_(function.outputs),
         needsPicture_(std::ranges::any_of(outputs_, &BatchOutput::nameNeedsPicture)),
+        writer_(function, job),
         run_(files, job,
              {.process = [this](size_t i) { return Process(i); },
               .history = function.history,
@@ -185,10 +187,10 @@ class Batch {
     PictureRecord& own = copy != nullptr ? *copy : *picture;
     // The source may have bound its own plug-in format to the row that the destination's had.
     if (target.formatIndex == kSpareRow) (void)FindPluginFormat("x." + target.extension);
-    if (const Status status = Change(own, target); status != Status::Ok) {
-      return Failure(file, status,
-                     status == Status::TooManyColors ? function_.reduceHint : std::string());
-    }
+    std::string hint;
+    const Status prepared =
+        IsOnlyPlanned() ? writer_.Plan(own, target, hint) : writer_.Prepare(own, target, hint);
+    if (prepared != Status::Ok) return Failure(file, prepared, std::move(hint));
     Destination destination;
     destination.path = target.output->nameNeedsPicture ? PathOf(file, target, &own) : target.path;
     destination.formatIndex = target.formatIndex;
@@ -240,18 +242,6 @@ class Batch {
                    static_cast<uint64_t>(picture->pageCount));
   }
 
-  // The function's own work, then the depth that the format takes.
-  Status Change(PictureRecord& picture, const OutputTarget& target) const {
-    if (target.output->transform && !IsOnlyPlanned())
-      RETURN_IF_BAD(target.output->transform(picture));
-    const auto deepest = static_cast<int32_t>(FormatRow(target.formatIndex).maxBits);
-    if (picture.bitsPerPixel <= deepest) return Status::Ok;
-    if (!Reduces(target)) return Status::TooManyColors;
-    return IsOnlyPlanned() ? Status::Ok : ReduceColors(picture, deepest, job_.reduction);
-  }
-
-  bool Reduces(const OutputTarget& target) const { return function_.reduce || target.kept; }
-
   // Settles the name and writes, again when someone else has taken the name since it was found
   // free.
   std::optional<FileOutcome> WriteUnderFreeName(size_t i, const Destination& planned,
@@ -288,15 +278,15 @@ class Batch {
       return true;
     }
     std::string hint;
-    const Status status = function_.dryRun ? Status::Ok : Write(picture, destination, target, hint);
+    const Status status =
+        function_.dryRun ? Status::Ok : writer_.Write(picture, destination, target, hint);
     if (status == Status::Ok) {
       outcome = Written(file, destination, replaces, picture);
       return true;
     }
     GiveBack(destination.path);
     if (!destination.replace && LostRace(status, destination.path)) return false;
-    outcome = Failure(file, status,
-                      hint.empty() ? WriteHint(destination, status, picture, target) : hint);
+    outcome = Failure(file, status, std::move(hint));
     return true;
   }
 
@@ -400,64 +390,6 @@ class Batch {
                               job_.stop.Token());
   }
 
-  // Codecs may take less than their row says; colors are then reduced further, step by step.
-  Status Write(PictureRecord& picture, const Destination& destination, const OutputTarget& target,
-               std::string& hint) const {
-    const bool beside =
-        (job_.naming.beside || job_.destinationFolder.empty()) && target.output->folder.empty();
-    const bool there = beside || !function_.out.empty() || destination.elsewhere;
-    if (!there && !platform::MakeFolders(platform::FolderOf(destination.path)))
-      return Status::ErrorCreatingFile;
-    WriteOptions write{.encode = job_.encode};
-    write.existing = destination.replace ? platform::Existing::Replace : platform::Existing::Refuse;
-    write.keepMetadata = function_.keepMetadata;
-    write.comment = job_.writeComments;
-    write.password = destination.password;
-    if (target.output->quality > 0) write.encode.SetQuality(target.output->quality);
-    if (destination.recycle) {
-      write.makeWay = [&] {
-        return !platform::FileExists(destination.path) || platform::MoveToTrash(destination.path);
-      };
-    }
-    const PathText source = picture.fileName;
-    RefreshExif(picture);
-    if (target.output->mostBytes > 0) RETURN_IF_BAD(ChooseQuality(picture, target, write, hint));
-    Status status = WritePictureAs(picture, destination.path, target.formatIndex, write);
-    for (const int32_t bits : {8, 4, 1}) {
-      if (status != Status::TooManyColors || !Reduces(target)) break;
-      if (picture.bitsPerPixel <= bits) continue;
-      RETURN_IF_BAD(ReduceColors(picture, bits, job_.reduction));
-      status = WritePictureAs(picture, destination.path, target.formatIndex, write);
-    }
-    picture.fileName = source;
-    return status;
-  }
-
-  // The best quality whose file is small enough, found by writing temporary files.
-  static Status ChooseQuality(PictureRecord& picture, const OutputTarget& target,
-                              WriteOptions& write, std::string& hint) {
-    const PathText source = picture.fileName;
-    uint64_t smallest = 0;
-    const auto trial = [&](int32_t quality, uint64_t& bytes) {
-      platform::TemporaryFile file;
-      if (!file.Create("." + target.extension)) return Status::ErrorCreatingFile;
-      WriteOptions attempt = write;
-      attempt.existing = platform::Existing::Replace;
-      attempt.makeWay = {};
-      attempt.encode.SetQuality(quality);
-      const Status status = WritePictureAs(picture, file.Path(), target.formatIndex, attempt);
-      bytes = platform::FactsOf(file.Path()).size;
-      return status;
-    };
-    int32_t best = 0;
-    const Status status = FindQuality(target.output->mostBytes, trial, best, smallest);
-    if (status == Status::Ok) write.encode.SetQuality(best);
-    picture.fileName = source;
-    if (status == Status::UnsuitableImage)
-      hint = Tr("At the lowest quality it has %1 bytes.", ThousandsText(smallest));
-    return status;
-  }
-
   FileOutcome Written(const BatchFile& file, const Destination& destination, bool replaces,
                       const PictureRecord& picture) const {
     if (function_.keepTimes && !function_.dryRun &&
@@ -468,40 +400,9 @@ class Batch {
       return outcome;
     }
     FileOutcome outcome{.source = file.name, .destination = destination.path, .replaced = replaces};
-    outcome.note = LostMetadata(picture, destination);
+    outcome.note = writer_.Note(picture, destination);
     if (!function_.dryRun) NoteLostAttributes(outcome);
     return outcome;
-  }
-
-  // Names the metadata the format could not store; shown by --verbose.
-  RecordedText LostMetadata(const PictureRecord& picture, const Destination& destination) const {
-    const PictureMetadata& metadata = picture.metadata;
-    std::string lost;
-    if (!metadata.exif.empty() && (picture.lostMetadata & kLostExif) != 0) lost += ", EXIF";
-    if (!metadata.xmp.empty() && (picture.lostMetadata & kLostXmp) != 0) lost += ", XMP";
-    if (!metadata.icc.empty() && (picture.lostMetadata & kLostIcc) != 0) lost += ", color profile";
-    if (!function_.keepMetadata || lost.empty()) return {};
-    return TrRecorded("%1 cannot store: %2.", UpperCase(destination.extension), lost.substr(2));
-  }
-
-  std::string WriteHint(const Destination& destination, Status status, const PictureRecord& picture,
-                        const OutputTarget& target) const {
-    if (status == Status::TooManyColors)
-      return Reduces(target) ? std::string() : function_.reduceHint;
-    const std::string& path = destination.path;
-    const std::string folder = platform::FolderOf(path);
-    if (status == Status::ErrorWritingFile && !platform::SystemReason().empty())
-      return ReasonSentence();
-    const bool full = status == Status::ErrorWritingFile &&
-                      platform::FreeSpace(folder) < picture.image.Bytes().size();
-    if (full) return Tr("Not enough disk space at the destination.");
-    if (status != Status::ErrorCreatingFile) return {};
-    if (platform::IsFolder(path)) return Tr("\"%1\" is a folder.", path);
-    if (!folder.empty() && !platform::IsFolder(folder))
-      return WithReason(Tr("The folder \"%1\" does not exist.", folder));
-    if (destination.recycle && !platform::HasTrash(path))
-      return Tr("There is no recycle bin for \"%1\".", path);
-    return WithReason(Tr("\"%1\" cannot be created.", path));
   }
 
   const std::span<const BatchFile> files_;
@@ -511,6 +412,7 @@ class Batch {
   const bool asksEveryName_;
   std::vector<BatchOutput> outputs_;
   const bool needsPicture_;  // a name of an output has macros about the picture
+  const OutputWriter writer_;
   mutable std::mutex mutex_;  // over what follows
   RunNames names_;
   Rules rules_;

@@ -7,6 +7,7 @@
 #include <string>
 #include <vector>
 
+#include "batch/fit_picture.h"
 #include "batch/job.h"
 #include "batch/output_target.h"
 
@@ -43,7 +44,8 @@ struct BatchFunction {
                         // they always are for a format that was kept
   std::string reduceHint = {};                   // follows "Too many colors."
   bool autoOrient = false;                       // pictures are rotated upright by EXIF orientation
-  bool keepMetadata = true;                      // EXIF, XMP and color profiles are copied
+  bool keepMetadata = true;                      // EXIF, XMP and comments are copied
+  ProfileRequest profile = {};                   // color profiles
   // outputs get the modification times of their sources
   bool keepTimes = false;
   // the folders of the selection are recreated in the destination folder

@@ -10,7 +10,7 @@ namespace fotomill {
 // those in force once, by EncodeOptionsFromSettings. Numbers may lie outside their ranges: writers
 // clamp them.
 struct EncodeOptions {
-  bool preserveMetadata = true;  // PreserveEXIF: EXIF, XMP and ICC go along
+  bool preserveMetadata = true;  // PreserveEXIF: EXIF, XMP and comments go along
   int32_t resolution = 300;      // TiffResolution: dots per inch of pictures that have none
 
   bool bmpOs2 = false;                              // WriteOS2Bitmaps

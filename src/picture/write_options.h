@@ -16,7 +16,8 @@ struct WriteOptions {
   EncodeOptions encode = {};
   // what to do about a file of the destination's name
   platform::Existing existing = platform::Existing::Replace;
-  // EXIF, XMP and ICC of the record go into formats that can hold them
+  // EXIF, XMP and the comment of the record go into formats that can hold them; the color profile
+  // always does
   bool keepMetadata = true;
   // without any loss where the format can, whatever `encode` says
   bool lossless = false;

@@ -19,6 +19,8 @@
 #include "platform/existence.h"
 #include "platform/files.h"
 #include "platform/paths.h"
+#include "processing/color/color_profile.h"
+#include "registry/registry.h"
 #include "settings/settings.h"
 #include "texts/status_text.h"
 #include "texts/texts.h"
@@ -37,6 +39,7 @@ struct ConvertOptions {
   std::string steps, recipe;        // --do, --recipe
   std::string overwrite;  // empty: ask where someone can answer, else keep both
   std::string metadata = "keep";
+  std::string profile = "keep";  // "keep", "srgb", or a file
   int32_t quality = 0;  // 1 to 100; 0: as configured
   int32_t page = 1;     // from 1
   int32_t jobs = 0;
@@ -50,6 +53,7 @@ struct ConvertOptions {
 };
 
 constexpr size_t kLongestPrefix = SettingPrefix::Capacity();
+constexpr uint64_t kMostProfileBytes = 8 << 20;
 
 // The option decides if given, else the settings. If the settings say ask and nobody can answer,
 // both files are kept.
@@ -81,6 +85,25 @@ BatchFunction FunctionOf(const ConvertOptions& options, const Recipe* recipe) {
   if (options.apply && recipe != nullptr && recipe->HasSteps())
     function.history = FunctionOfFamily(recipe->First()->family);
   return function;
+}
+
+// Reads --profile. What is wrong with it, or empty.
+std::string ReadProfile(const ConvertOptions& options, const BatchJob& job,
+                        ProfileRequest& request) {
+  if (options.profile == "keep") return {};
+  request.use = ProfileRequest::Use::Srgb;
+  if (options.profile == "srgb") return {};
+  std::string bytes;
+  const auto read = platform::ReadWholeFile(options.profile, kMostProfileBytes, bytes);
+  if (read != platform::ReadResult::Done)
+    return Tr("The color profile \"%1\" cannot be read.", options.profile);
+  request.use = ProfileRequest::Use::Given;
+  request.profile = std::make_shared<const std::vector<uint8_t>>(bytes.begin(), bytes.end());
+  if (ColorsOfProfile(*request.profile) != ProfileColors::Rgb)
+    return Tr("\"%1\" is not an ICC profile of RGB colors.", options.profile);
+  if (job.formatIndex != kNoFormat && !HoldsProfile(FormatRow(job.formatIndex)))
+    return Tr("%1 files cannot hold a color profile.", FormatRow(job.formatIndex).extension.view());
+  return {};
 }
 
 // Reads the format that is asked for into `job`; none where every file keeps its own. What is
@@ -161,6 +184,8 @@ int RunConvert(const ConvertOptions& options, const CommandContext& context) {
   if (const std::string wrong = CheckOptions(options, context, recipe.get(), job); !wrong.empty())
     return UsageError(context, wrong);
   BatchFunction function = FunctionOf(options, recipe.get());
+  if (const std::string wrong = ReadProfile(options, job, function.profile); !wrong.empty())
+    return UsageError(context, wrong);
   if (const std::string wrong = TakeRecipe(options, recipe, job, function); !wrong.empty())
     return UsageError(context, wrong);
   const auto selection = SelectFiles(options.selection, context);
@@ -210,7 +235,9 @@ void SetUp(CLI::App& app, CommandContext& context, const std::shared_ptr<Convert
   AddFlag(app, "--keep-tree", options->keepTree, "Recreate the source folders in --dest");
   AddFlag(app, "--keep-times", options->keepTimes, "Keep the modification times of the sources");
   AddChoice(app, "--metadata", options->metadata, "HOW",
-            "Keep (default) or strip EXIF, XMP and color profiles", {"keep", "strip"});
+            "Keep (default) or strip EXIF, XMP and comments", {"keep", "strip"});
+  AddName(app, "--profile", options->profile, "keep|srgb|FILE",
+          "Color profile: keep (default), convert to sRGB, or convert to the profile in FILE");
   AddFlag(app, "--auto-orient", options->autoOrient, "Rotate pictures upright by EXIF orientation");
   AddFlag(app, "--reduce", options->reduce, "Reduce colors if the format supports fewer");
   AddNumber(app, "--quality", options->quality, "N", 1, 100, "JPEG and WebP quality, 1 to 100");

@@ -124,6 +124,7 @@ Directory MakeDirectory(const PictureRecord& picture, const WriteOptions& option
   directory.Value(kHdpDpiY, kHdpFloat, dpi(metadata.dpiY));
   directory.Value(kHdpImageOffset, kHdpLong, 0);
   directory.Value(kHdpImageSize, kHdpLong, 0);
+  directory.Block(kHdpIcc, kHdpUndefined, metadata.icc);
   if (!options.KeepsMetadata()) return directory;
   bool described = false;
   for (const ExifEntry& entry : extra.exif.first) {
@@ -137,7 +138,6 @@ Directory MakeDirectory(const PictureRecord& picture, const WriteOptions& option
   if (extra.placed.exifOffset != 0) directory.Value(kHdpExif, kHdpLong, extra.placed.exifOffset);
   if (extra.placed.gpsOffset != 0) directory.Value(kHdpGps, kHdpLong, extra.placed.gpsOffset);
   directory.Block(kHdpXmp, kHdpByte, metadata.xmp);
-  directory.Block(kHdpIcc, kHdpUndefined, metadata.icc);
   return directory;
 }
 

@@ -250,12 +250,14 @@ bool WriteProfile(jpeg_compress_struct& info, std::span<const uint8_t> profile) 
   return true;
 }
 
-void WriteMetadata(jpeg_compress_struct& info, PictureRecord& picture) {
-  if (!WriteSegment(info, kApp1, kExifHead, picture.metadata.exif))
+// `keep`: whether more goes along than the profile, which belongs to the colors.
+void WriteMetadata(jpeg_compress_struct& info, PictureRecord& picture, bool keep) {
+  const PictureMetadata& metadata = picture.metadata;
+  if (keep && !WriteSegment(info, kApp1, kExifHead, metadata.exif))
     picture.lostMetadata |= kLostExif;
-  if (!WriteSegment(info, kApp1, kXmpHead, picture.metadata.xmp)) picture.lostMetadata |= kLostXmp;
-  if (!WriteProfile(info, picture.metadata.icc)) picture.lostMetadata |= kLostIcc;
-  (void)WriteSegment(info, JPEG_COM, {}, picture.comment);
+  if (keep && !WriteSegment(info, kApp1, kXmpHead, metadata.xmp)) picture.lostMetadata |= kLostXmp;
+  if (!WriteProfile(info, metadata.icc)) picture.lostMetadata |= kLostIcc;
+  if (keep) (void)WriteSegment(info, JPEG_COM, {}, picture.comment);
 }
 
 // A row as the encoder takes it: grays, or blue, green, red.
@@ -286,7 +288,7 @@ Status WriteAll(JpegWriter& writer, PictureRecord& picture, const WriteOptions& 
   const bool written = Guarded(writer.errors, [&] {
     SetParameters(writer, picture, gray, options.encode);
     jpeg_start_compress(&writer.info, TRUE);
-    if (options.KeepsMetadata()) WriteMetadata(writer.info, picture);
+    WriteMetadata(writer.info, picture, options.KeepsMetadata());
     for (int32_t y = 0; y < image.Height() && status == Status::Ok; ++y) {
       if (!expanded.empty()) ExpandRow(picture, y, gray, expanded);
       JSAMPROW row = expanded.empty() ? const_cast<JSAMPROW>(image.Row(y).data()) : expanded.data();

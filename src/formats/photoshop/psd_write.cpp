@@ -63,8 +63,8 @@ void WriteResources(ByteWriter& out, const PictureRecord& picture, bool withMeta
   const uint64_t place = out.Position();
   out.Be32(0);
   WriteResolution(out, picture.metadata);
+  WriteResource(out, PsdResource::IccProfile, picture.metadata.icc);
   if (withMetadata) {
-    WriteResource(out, PsdResource::IccProfile, picture.metadata.icc);
     WriteResource(out, PsdResource::Exif, picture.metadata.exif);
     WriteResource(out, PsdResource::Xmp, picture.metadata.xmp);
   }

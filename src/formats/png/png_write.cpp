@@ -60,14 +60,13 @@ void SetMetadata(const PngWriter& writer, const PictureRecord& picture, bool kee
                  static_cast<png_uint_32>(std::lround(metadata.dpiY * kPngInchesPerMetre)),
                  PNG_RESOLUTION_METER);
   }
-  if (!keep) return;
   if (!metadata.icc.empty()) {
     png_set_benign_errors(writer.png, 1);  // an odd profile is left out, not the picture
     png_set_iCCP(writer.png, writer.info, "ICC profile", PNG_COMPRESSION_TYPE_BASE,
                  metadata.icc.data(), static_cast<png_uint_32>(metadata.icc.size()));
     if (png_get_valid(writer.png, writer.info, PNG_INFO_iCCP) == 0) lost |= kLostIcc;
   }
-  if (!metadata.exif.empty()) {
+  if (keep && !metadata.exif.empty()) {
     png_set_eXIf_1(writer.png, writer.info, static_cast<png_uint_32>(metadata.exif.size()),
                    const_cast<png_bytep>(metadata.exif.data()));
   }

@@ -182,15 +182,15 @@ void SetMetadata(TiffOutput& output, PictureRecord& picture, const WriteOptions&
                metadata.dpiY > 0 ? metadata.dpiY : options.encode.resolution);
   if (!keep || picture.metadata.exif.empty())
     TIFFSetField(tiff, TIFFTAG_SOFTWARE, std::string(kCreator).c_str());
+  const auto setBlock = [tiff](uint32_t tag, const std::vector<uint8_t>& block) {
+    if (!block.empty()) TIFFSetField(tiff, tag, static_cast<uint32_t>(block.size()), block.data());
+  };
+  setBlock(TIFFTAG_ICCPROFILE, metadata.icc);
   if (!keep) return;
   const ExifDirectories exif = ParseExifBlock(metadata.exif);
   if (exif.Empty() && !metadata.exif.empty()) picture.lostMetadata |= kLostExif;
   SetDescription(tiff, exif);
   WriteExif(output, exif);
-  const auto setBlock = [tiff](uint32_t tag, const std::vector<uint8_t>& block) {
-    if (!block.empty()) TIFFSetField(tiff, tag, static_cast<uint32_t>(block.size()), block.data());
-  };
-  setBlock(TIFFTAG_ICCPROFILE, metadata.icc);
   setBlock(TIFFTAG_XMLPACKET, metadata.xmp);
   const std::string comment(picture.comment.begin(), picture.comment.end());
   const char* described = nullptr;

@@ -365,8 +365,8 @@ void WriteChunk(ByteWriter& out, std::string_view name, std::span<const uint8_t>
 uint64_t ChunkBytes(uint64_t data) { return data == 0 ? 0 : 8 + data + data % 2; }
 
 // The encoder's file, with the chunks of metadata around its pixels where there are any.
-void WriteFile(ByteWriter& out, const PictureRecord& picture, std::span<const uint8_t> encoded) {
-  const PictureMetadata& metadata = picture.metadata;
+void WriteFile(ByteWriter& out, const PictureRecord& picture, const PictureMetadata& metadata,
+               std::span<const uint8_t> encoded) {
   const auto pixels = encoded.subspan(kRiffHead);
   // lossy with alpha
   const bool extended = pixels.size() >= 18 && std::memcmp(pixels.data(), "VP8X", 4) == 0;
@@ -461,9 +461,12 @@ Status WebpWrite(PictureRecord& picture, const WriteOptions& options) {
   const bool useOther = other.writer.size > 0 && other.writer.size < encoded.writer.size;
   const WebPMemoryWriter& chosen = useOther ? other.writer : encoded.writer;
   const std::span<const uint8_t> bytes(chosen.mem, chosen.size);
-  const bool keep = options.KeepsMetadata() && !picture.metadata.Empty();
-  if (keep && bytes.size() > kRiffHead) {
-    WriteFile(out, picture, bytes);
+  // the profile goes along whatever becomes of the rest
+  PictureMetadata kept;
+  if (options.KeepsMetadata()) kept = picture.metadata;
+  kept.icc = picture.metadata.icc;
+  if (!kept.Empty() && bytes.size() > kRiffHead) {
+    WriteFile(out, picture, kept, bytes);
   } else {
     out.Bytes(bytes);
   }

@@ -2,6 +2,8 @@
 
 #include <lcms2.h>
 
+#include <algorithm>
+#include <iterator>
 #include <vector>
 
 #include "core/byte_reader.h"
@@ -50,6 +52,18 @@ Profile OpenTrustedProfile(std::span<const uint8_t> bytes) {
   if (trusted.empty()) return nullptr;
   return Profile(
       cmsOpenProfileFromMem(trusted.data(), static_cast<cmsUInt32Number>(trusted.size())));
+}
+
+ProfileColors ColorsOfProfile(std::span<const uint8_t> bytes) {
+  const Profile profile = OpenTrustedProfile(bytes);
+  if (profile == nullptr) return ProfileColors::None;
+  constexpr cmsProfileClassSignature kDevices[] = {cmsSigInputClass, cmsSigDisplayClass,
+                                                   cmsSigOutputClass, cmsSigColorSpaceClass};
+  if (std::ranges::find(kDevices, cmsGetDeviceClass(profile.get())) == std::end(kDevices))
+    return ProfileColors::None;
+  const cmsColorSpaceSignature colors = cmsGetColorSpace(profile.get());
+  if (colors == cmsSigGrayData) return ProfileColors::Gray;
+  return colors == cmsSigRgbData ? ProfileColors::Rgb : ProfileColors::Other;
 }
 
 }  // namespace fotomill

@@ -22,15 +22,9 @@ constexpr int32_t kUnseen = 1;                // a difference of 8-bit values th
 
 // Null for bytes that are no profile of devices with RGB or gray colors.
 Profile OpenProfile(std::span<const uint8_t> bytes) {
-  Profile profile = OpenTrustedProfile(bytes);
-  if (profile == nullptr) return nullptr;
-  constexpr cmsProfileClassSignature kDevices[] = {cmsSigInputClass, cmsSigDisplayClass,
-                                                   cmsSigOutputClass, cmsSigColorSpaceClass};
-  const bool device =
-      std::ranges::find(kDevices, cmsGetDeviceClass(profile.get())) != std::end(kDevices);
-  const cmsColorSpaceSignature colors = cmsGetColorSpace(profile.get());
-  return device && (colors == cmsSigRgbData || colors == cmsSigGrayData) ? std::move(profile)
-                                                                         : nullptr;
+  const ProfileColors colors = ColorsOfProfile(bytes);
+  const bool known = colors == ProfileColors::Rgb || colors == ProfileColors::Gray;
+  return known ? OpenTrustedProfile(bytes) : nullptr;
 }
 
 Profile OpenSource(std::span<const uint8_t> bytes) {

@@ -75,7 +75,7 @@ constexpr SetupItem kItems[] = {
     Item(Batches,    TrLater("Existing files"), OverwritePromptPreviews,      "Show previews when asking"),
     Item(Batches,    TrLater("Existing files"), OverwritePromptRecycle,       "Move replaced files to the trash"),
     Item(Saving,     TrLater("New files"),          DefaultFileExtension,           "Default format"),
-    Item(Saving,     TrLater("New files"),          PreserveEXIF,                   "Keep EXIF, XMP and color profiles"),
+    Item(Saving,     TrLater("New files"),          PreserveEXIF,                   "Keep EXIF, XMP and comments"),
     Item(Saving,     TrLater("New files"),          WriteFileComments,              "Write comments into files of plug-in formats"),
     Item(Saving,     TrLater("New files"),          PasswordProtect,                "Protect files with a password if the format supports it"),
     Item(Saving,     TrLater("New files"),          TiffResolution,                 "Resolution of pictures without one (dots per inch)"),

@@ -66,7 +66,7 @@ DestinationDialog::DestinationDialog(wxWindow* parent, const wxString& verb,
 
   reduce_ = new wxCheckBox(this, wxID_ANY, Label("Reduce &colors if the format supports fewer"));
   orient_ = new wxCheckBox(this, wxID_ANY, Label("Rotate pictures &upright by EXIF orientation"));
-  metadata_ = new wxCheckBox(this, wxID_ANY, Label("&Keep EXIF, XMP and color profiles"));
+  metadata_ = new wxCheckBox(this, wxID_ANY, Label("&Keep EXIF, XMP and comments"));
   reduce_->SetValue(true);
   orient_->SetValue(settings.ExifAdjustOrientation != 0);
   metadata_->SetValue(settings.PreserveEXIF != 0);

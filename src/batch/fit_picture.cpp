@@ -1,0 +1,74 @@
+#include "batch/fit_picture.h"
+
+#include "metadata/exif/picture_exif.h"
+#include "picture/gray_palette.h"
+#include "processing/color/color_profile.h"
+#include "processing/color/color_transform.h"
+#include "processing/promote.h"
+#include "texts/texts.h"
+
+namespace fotomill {
+
+namespace {
+
+bool IsGray(const PictureRecord& picture) {
+  return HasOnlyGrays(picture.palette, picture.image.Colors());
+}
+
+// Gray pixels need a profile of grays, others one of RGB. Inks have no profile of their own any
+// more when they are RGB pixels here.
+bool SuitsPixels(const PictureRecord& picture) {
+  const ProfileColors wanted = IsGray(picture) ? ProfileColors::Gray : ProfileColors::Rgb;
+  return ColorsOfProfile(picture.metadata.icc) == wanted;
+}
+
+// Brings the colors from the picture's profile to another one; empty: sRGB.
+void ConvertColors(PictureRecord& picture, std::span<const uint8_t> target) {
+  const ColorTransform transform(picture.metadata.icc, target);
+  if (!transform.ChangesColors()) return;
+  transform.Apply(picture.image);
+  const auto table = picture.image.ColorTable();
+  for (size_t i = 0; i < table.size() / 4; ++i) {
+    for (size_t c = 0; c < 3; ++c) picture.palette[3 * i + c] = table[4 * i + 2 - c];
+  }
+}
+
+Status FitOrientation(PictureRecord& picture, bool keepsTag) {
+  if (keepsTag || OrientationOf(picture) == Orientation::Upright) return Status::Ok;
+  // the old and the turned picture are there at a time
+  RETURN_IF_BAD(CheckFileMemory(2 * (picture.image.Bytes().size() + picture.alpha.Bytes().size())));
+  return TurnUpright(picture);
+}
+
+Status GiveProfile(PictureRecord& picture, const FormatEntry& row,
+                   const std::vector<uint8_t>& profile, std::string& hint) {
+  if (!HoldsProfile(row)) {
+    hint = Tr("%1 files cannot hold a color profile.", row.extension.view());
+    return Status::UnsuitableImage;
+  }
+  if (IsGray(picture)) RETURN_IF_BAD(PromotePicture(picture));
+  ConvertColors(picture, profile);
+  picture.metadata.icc = profile;
+  return Status::Ok;
+}
+
+}  // namespace
+
+bool HoldsProfile(const FormatEntry& row) { return (row.keepsMetadata & kLostIcc) != 0; }
+
+Status FitPicture(PictureRecord& picture, const FormatEntry& row, const FitRequest& request,
+                  std::string& hint) {
+  if (picture.image.Empty()) return Status::Ok;
+  const bool keepsTag = request.keepsMetadata && (row.keepsMetadata & kLostExif) != 0;
+  RETURN_IF_BAD(FitOrientation(picture, keepsTag || !request.turnsUpright));
+  if (request.profile.use == ProfileRequest::Use::Given)
+    return GiveProfile(picture, row, *request.profile.profile, hint);
+  if (picture.metadata.icc.empty()) return Status::Ok;
+  const bool keep = request.profile.use == ProfileRequest::Use::Keep;
+  if (keep && HoldsProfile(row) && SuitsPixels(picture)) return Status::Ok;
+  ConvertColors(picture, {});
+  picture.metadata.icc.clear();
+  return Status::Ok;
+}
+
+}  // namespace fotomill
