@@ -43,7 +43,7 @@ constexpr Place kPlaces[] = {
     {"BGA"},
     {"BMP"},
     {"CDR", "(CDR) Corel Draw Preview", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES},
-    {"CUT", "(CUT) Dr. Halo", 1, 8, FMT_BITMAP},
+    {"CUT"},
     {"DCX"},
     {"DIB"},
     {"EXE", "(EXE) Self-displaying image", 0, 24, FMT_BITMAP},

@@ -1,0 +1,199 @@
+// Dr. Halo (CUT), little-endian: 256 colors, which a palette file of the same name has.
+//
+//   offset size  field
+//        0    4  width, height
+//        4    2  reserved
+//        6       rows from the top, each with the bytes of its code before it, 2 bytes
+//
+// A code is made of 128 + count and a value for a run, of count and so many bytes as they are, and
+// ends with 0. halo_palette.h has the palette.
+//
+// The reader fills what a row's code leaves open with 0, and drops what would go beyond it. Without
+// a palette the picture is gray. Source: J. Murray and W. vanRyper, "Encyclopedia of Graphics File
+// Formats", 2nd edition (1996).
+#include "formats/drhalo/cut.h"
+
+#include <algorithm>
+#include <cstring>
+#include <vector>
+
+#include "core/byte_reader.h"
+#include "core/byte_writer.h"
+#include "formats/drhalo/halo_palette.h"
+#include "platform/file_view.h"
+#include "processing/promote.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr uint64_t kHeaderSize = 6;
+constexpr uint8_t kRun = 0x80, kCount = 0x7f;
+constexpr size_t kMostInToken = 127;
+constexpr size_t kShortestRun = 3;
+constexpr uint64_t kLeastRowSize = 2;  // the size of its code alone
+
+struct CutHeader {
+  int32_t width = 0, height = 0;
+};
+
+// FileReadError for a short header; DamagedFile also for a reserved field in use, since nothing
+// else tells such files.
+Status ParseHeader(std::span<const uint8_t> file, CutHeader& header) {
+  ByteReader bytes(file);
+  header.width = bytes.Le16();
+  header.height = bytes.Le16();
+  const uint16_t reserved = bytes.Le16();
+  if (!bytes.Ok()) return Status::FileReadError;
+  return header.width < 1 || header.height < 1 || reserved != 0 ? Status::DamagedFile : Status::Ok;
+}
+
+void DescribePicture(const CutHeader& header, const ReadRequest& request, PictureRecord& picture) {
+  picture.width = header.width;
+  picture.height = header.height;
+  picture.bitsPerPixel = 8;
+  picture.imageBytes = EstimateImageBytes(header.width, header.height, 8);
+  picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
+  picture.palette = GrayRamp();
+  picture.warning.Clear();
+  switch (ReadHaloPalette(request.fileName, picture.palette)) {
+    case HaloPaletteResult::Read: picture.typeName.AssignCut("Dr. Halo with palette"); break;
+    case HaloPaletteResult::Damaged:
+      picture.warning.AssignCut("The palette file (PAL) is damaged.");
+      [[fallthrough]];
+    case HaloPaletteResult::Missing: picture.typeName.AssignCut("Dr. Halo without palette"); break;
+  }
+}
+
+// FileReadError when the code ends within a token.
+Status DecodeRow(std::span<const uint8_t> code, std::span<uint8_t> row) {
+  ByteReader bytes(code);
+  for (size_t x = 0; bytes.Left() > 0;) {
+    const uint8_t token = bytes.U8();
+    const size_t count = token & kCount, room = std::min(count, row.size() - x);
+    if (token == 0) break;
+    if ((token & kRun) != 0) {
+      std::memset(row.data() + x, bytes.U8(), room);
+    } else {
+      const auto plain = bytes.Take(count);
+      std::copy_n(plain.begin(), std::min(room, plain.size()),
+                  row.begin() + static_cast<ptrdiff_t>(x));
+    }
+    if (!bytes.Ok()) return Status::FileReadError;
+    x += room;
+  }
+  return Status::Ok;
+}
+
+Status ReadRows(platform::FileView& file, const CutHeader& header, const PictureRecord& picture,
+                PackedImage& image) {
+  ByteReader bytes(file.Bytes());
+  bytes.Seek(kHeaderSize);
+  for (int32_t y = 0; y < header.height; ++y) {
+    const auto code = bytes.Take(bytes.Le16());
+    if (!bytes.Ok()) return Status::FileReadError;
+    RETURN_IF_BAD(DecodeRow(code, image.Row(y).first(static_cast<size_t>(header.width))));
+    file.DropBefore(bytes.Position());
+    RETURN_IF_BAD(picture.ReportRow(y));
+  }
+  return Status::Ok;
+}
+
+void PutPlain(std::span<const uint8_t> bytes, std::vector<uint8_t>& code) {
+  while (!bytes.empty()) {
+    const auto part = bytes.first(std::min(bytes.size(), kMostInToken));
+    code.push_back(static_cast<uint8_t>(part.size()));
+    code.insert(code.end(), part.begin(), part.end());
+    bytes = bytes.subspan(part.size());
+  }
+}
+
+void EncodeRow(std::span<const uint8_t> row, std::vector<uint8_t>& code) {
+  code.clear();
+  size_t plain = 0;  // where the bytes that no run has taken begin
+  for (size_t x = 0; x < row.size();) {
+    const size_t end = std::min(row.size(), x + kMostInToken);
+    size_t next = x + 1;
+    while (next < end && row[next] == row[x]) ++next;
+    if (next - x >= kShortestRun) {
+      PutPlain(row.subspan(plain, x - plain), code);
+      code.push_back(static_cast<uint8_t>(kRun | (next - x)));
+      code.push_back(row[x]);
+      plain = next;
+    }
+    x = next;
+  }
+  PutPlain(row.subspan(plain), code);
+  code.push_back(0);
+}
+
+// UnsuitableImage when the code of a row is longer than its field can say.
+Status WriteRows(ByteWriter& out, const PictureRecord& picture, const PackedImage& image) {
+  out.Le16(static_cast<uint16_t>(image.Width()));
+  out.Le16(static_cast<uint16_t>(image.Height()));
+  out.Le16(0);
+  std::vector<uint8_t> code;
+  for (int32_t y = 0; y < image.Height() && !out.Failed(); ++y) {
+    RETURN_IF_BAD(picture.ReportRow(y));
+    EncodeRow(image.Row(y).first(static_cast<size_t>(image.Width())), code);
+    if (code.size() > UINT16_MAX) return Status::UnsuitableImage;
+    out.Le16(static_cast<uint16_t>(code.size()));
+    out.Bytes(code);
+  }
+  return out.WriteRest() ? Status::Ok : Status::ErrorWritingFile;
+}
+
+}  // namespace
+
+Status CutInfo(PictureRecord& picture, const ReadRequest& request) {
+  picture.typeName.Clear();
+  if (request.signedOnly) return Status::UnsupportedFormat;
+  platform::FileView file;
+  if (!file.OpenHead(request.fileName.c_str(), kHeaderSize)) return Status::FileOpenError;
+  picture.fileSize = file.FileSize();
+  CutHeader header;
+  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
+  DescribePicture(header, request, picture);
+  return Status::Ok;
+}
+
+Status CutRead(PictureRecord& picture, const ReadRequest& request) {
+  const ProgressScope progress(picture);
+  picture.image.Free();
+  picture.alpha.Free();
+  platform::FileView file;
+  if (!file.Open(request.fileName)) return Status::FileOpenError;
+  CutHeader header;
+  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
+  DescribePicture(header, request, picture);
+  if (file.FileSize() - kHeaderSize < kLeastRowSize * static_cast<uint64_t>(header.height))
+    return Status::FileReadError;
+  PackedImage image;
+  RETURN_IF_BAD(NewPackedImage(header.width, header.height, &picture.palette, 8, image));
+  RETURN_IF_BAD(ReadRows(file, header, picture, image));
+  if (!file.Intact()) return Status::FileReadError;
+  picture.image = std::move(image);
+  return Status::Ok;
+}
+
+Status CutWrite(PictureRecord& picture, const WriteOptions& options) {
+  const ProgressScope progress(picture);
+  if (picture.image.Empty()) return Status::MemoryAllocationError;
+  if (picture.image.Bits() > 8) return Status::TooManyColors;
+  if (picture.image.Width() > UINT16_MAX || picture.image.Height() > UINT16_MAX)
+    return Status::UnsuitableImage;
+  PackedImage deeper;
+  if (picture.image.Bits() < 8) RETURN_IF_BAD(PromoteImage(picture.image, 8, deeper));
+  const PackedImage& image = deeper.Empty() ? picture.image : deeper;
+  const std::string name(picture.fileName.view());
+  ByteWriter out;
+  if (!out.Create(name)) return Status::ErrorCreatingFile;
+  RETURN_IF_BAD(WriteRows(out, picture, image));
+  HaloPaletteFile palette;
+  RETURN_IF_BAD(palette.Write(HaloPaletteName(name), picture.palette, options.existing));
+  RETURN_IF_BAD(CommitOutput(out, options));
+  palette.Keep();
+  return Status::Ok;
+}
+
+}  // namespace fotomill
