@@ -10,13 +10,13 @@
 namespace fotomill {
 
 std::string_view LooksLike(const std::string& fileName, int32_t formatIndex) {
-  const FileKind kind = IdentifyFile(fileName);
-  const bool asNamed =
-      formatIndex != kNoFormat && kind.IsOf(FormatRow(formatIndex).extension.view());
-  // Targa files have no signature, and the first bytes of many are those of an icon or a cursor.
-  const bool chance = formatIndex != kNoFormat && FormatRow(formatIndex).signatures.empty() &&
-                      (kind.IsOf("CUR") || kind.IsOf("ICO"));
-  return asNamed || chance ? std::string_view() : kind.name;
+  return KindBehindName(fileName, formatIndex).name;
+}
+
+std::string MisnamedRemark(const PictureRecord& picture) {
+  if (!OpenedByContents(picture)) return {};
+  return Tr("The contents are %1, whatever the name says.",
+            FormatRow(picture.formatIndex).extension.view());
 }
 
 std::string OpenHint(const std::string& fileName, Status status) {

@@ -8,6 +8,15 @@
 
 namespace fotomill {
 
+// Whether a file whose name lies is opened by what it holds.
+struct IdentifyOptions {
+  bool on = true;  // IdentifyMysteryViewFiles
+  // BatchIdentifyExceptions: extensions between semicolons whose files are never opened that way
+  std::string exceptions = "EXE;THN;SCR;DLL;VBX;CPL;DB";
+  int32_t mostSide = 32000;  // MaximumMysteryFileDimension: larger pictures are refused, pixels
+  bool operator==(const IdentifyOptions&) const = default;
+};
+
 // What of the settings decoding depends on. The values here are the settings' defaults; a job takes
 // those in force once, by ReadOptionsFromSettings.
 struct ReadOptions {
@@ -15,6 +24,7 @@ struct ReadOptions {
   bool recognizeApng = true;            // RecognizeAPNG: the frames of a PNG file are counted
   // AlphaBackground, 0x00BBGGRR: what the record's `defaultColour` becomes
   uint32_t alphaBackground = 0xffffff;
+  IdentifyOptions identify = {};
   bool operator==(const ReadOptions&) const = default;
 };
 

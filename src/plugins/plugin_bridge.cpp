@@ -130,6 +130,15 @@ Status TakeInfo(const FMW_PICTURE_INFO& info, PictureRecord& picture) {
   return Status::Ok;
 }
 
+// The module that reads a file: that of its name or, for a name that no module claims, the one that
+// the registry bound for the contents. Null if there is none.
+const PluginEntry* ReaderOf(std::string_view fileName) {
+  const PluginEntry* const named = FindPluginEntry(fileName);
+  if (named != nullptr) return named;
+  const std::string_view bound = FormatRow(kSpareRow).extension;
+  return bound.empty() ? nullptr : FindPluginEntry(std::string("x.").append(bound));
+}
+
 // Lets the module write the picture to `path`.
 Status CallWriter(const PluginEntry& entry, PictureRecord& picture, const std::string& path,
                   bool withComment) {
@@ -175,7 +184,7 @@ constexpr uint32_t kMostBits = 24;  // of a picture without its alpha
 }  // namespace
 
 Status PluginInfo(PictureRecord& picture, const ReadRequest& request) {
-  const PluginEntry* entry = FindPluginEntry(request.fileName);
+  const PluginEntry* entry = ReaderOf(request.fileName);
   if (entry == nullptr || entry->exports.getInfo == nullptr) return Status::UnsupportedFunction;
   FMW_PICTURE_INFO info = {};
   info.size = sizeof info;
@@ -192,7 +201,7 @@ Status PluginInfo(PictureRecord& picture, const ReadRequest& request) {
 }
 
 Status PluginRead(PictureRecord& picture, const ReadRequest& request) {
-  const PluginEntry* entry = FindPluginEntry(request.fileName);
+  const PluginEntry* entry = ReaderOf(request.fileName);
   if (entry == nullptr || entry->exports.readImage == nullptr) return Status::UnsupportedFunction;
   const std::string comment = CommentText(picture);
   int32_t error = 0;
@@ -231,7 +240,7 @@ Status PluginWrite(PictureRecord& picture, const WriteOptions& options) {
 }
 
 Status PluginComment(PictureRecord& picture, const char* fileName) {
-  const PluginEntry* entry = FindPluginEntry(fileName);
+  const PluginEntry* entry = ReaderOf(fileName);
   if (entry == nullptr) return Status::UnsupportedFunction;
   if (entry->exports.getComment == nullptr) return Status::Ok;
   int32_t error = 0;

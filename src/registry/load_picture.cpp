@@ -1,12 +1,59 @@
+#include <algorithm>
+#include <string>
+
+#include "core/text.h"
+#include "platform/paths.h"
 #include "processing/flatten.h"
 #include "registry/registry.h"
+#include "registry/signature.h"
 
 namespace fotomill {
 
-Status LoadPictureInfo(const ReadRequest& request, PicturePointer& picture) {
-  picture.reset();
-  const int32_t index = FindFormatByName(request.fileName);
-  if (index == kNoFormat) return Status::UnsupportedFormat;
+namespace {
+
+// The row of a format by its extension as it stands in the table, not as names match; else the
+// plug-in's, which is bound.
+int32_t RowOf(std::string_view extension) {
+  for (int32_t i = 0; i < kSpareRow; ++i) {
+    if (FormatRow(i).extension.view() == extension) return i;
+  }
+  return FindPluginFormat(std::string("x.").append(extension));
+}
+
+bool IsExcepted(std::string_view fileName, std::string_view exceptions) {
+  const std::string_view extension = platform::ExtensionOf(fileName);
+  while (!exceptions.empty()) {
+    const std::string_view item = exceptions.substr(0, exceptions.find(';'));
+    if (!item.empty() && EqualIgnoringCase(item, extension)) return true;
+    exceptions.remove_prefix(std::min(item.size() + 1, exceptions.size()));
+  }
+  return false;
+}
+
+// Whether a row may have refused a file because it is none of its own.
+bool IsRefusal(Status status) {
+  return status != Status::Ok && status != Status::FileOpenError &&
+         status != Status::MemoryAllocationError && status != Status::FunctionCancelled;
+}
+
+// Opens a file by the row of its name or, when that refuses, by one that its contents fit. `open`
+// is given a row's index and has the file only if it returns Ok.
+template <class Open>
+Status OpenByNameOrContents(const ReadRequest& request, const Open& open) {
+  const int32_t named = FindFormatByName(request.fileName);
+  const Status status = named == kNoFormat ? Status::UnsupportedFormat : open(named);
+  const IdentifyOptions& identify = request.options.identify;
+  if (!IsRefusal(status) || !identify.on || IsExcepted(request.fileName, identify.exceptions))
+    return status;
+  for (const std::string_view extension : KindBehindName(request.fileName, named).extensions) {
+    const int32_t index = RowOf(extension);
+    if (index == kNoFormat || FormatRow(index).enabled == 0 || !CanRead(FormatRow(index))) continue;
+    if (open(index) == Status::Ok) return Status::Ok;
+  }
+  return status;
+}
+
+Status DescribeAs(int32_t index, const ReadRequest& request, PicturePointer& picture) {
   PicturePointer made = NewPictureRecord(request.options.alphaBackground);
   if (made == nullptr) return Status::MemoryAllocationError;
   if (!made->fileName.Assign(request.fileName)) return Status::FileOpenError;
@@ -17,6 +64,27 @@ Status LoadPictureInfo(const ReadRequest& request, PicturePointer& picture) {
   if (row.info != nullptr) RETURN_IF_BAD(row.info(*made, request));
   picture = std::move(made);
   return Status::Ok;
+}
+
+}  // namespace
+
+Status LoadPictureInfo(const ReadRequest& request, PicturePointer& picture) {
+  picture.reset();
+  return OpenByNameOrContents(request, [&](int32_t index) {
+    PicturePointer made;
+    RETURN_IF_BAD(DescribeAs(index, request, made));
+    const bool tooLarge = std::max(made->width, made->height) > request.options.identify.mostSide;
+    if (tooLarge && OpenedByContents(*made)) return Status::UnsuitableImage;
+    picture = std::move(made);
+    return Status::Ok;
+  });
+}
+
+bool OpenedByContents(const PictureRecord& picture) {
+  if (picture.formatIndex != kSpareRow)
+    return picture.formatIndex != FindFormatByName(picture.fileName);
+  // A look at the name might bind the spare row to another plug-in.
+  return !EqualIgnoringCase(FormatRow(kSpareRow).extension, platform::ExtensionOf(picture.fileName));
 }
 
 Status LoadPicture(const ReadRequest& request, PicturePointer& picture, void* window) {
@@ -42,10 +110,10 @@ Status ReadPicture(const ReadRequest& request, PictureRecord& picture) {
 
 Status OpenAnimation(const ReadRequest& request, AnimationPointer& animation) {
   animation.reset();
-  const int32_t index = FindFormatByName(request.fileName);
-  if (index == kNoFormat) return Status::UnsupportedFormat;
-  const AnimateOperation animate = FormatRow(index).animate;
-  return animate == nullptr ? Status::UnsupportedFunction : animate(request, animation);
+  return OpenByNameOrContents(request, [&](int32_t index) {
+    const AnimateOperation animate = FormatRow(index).animate;
+    return animate == nullptr ? Status::UnsupportedFunction : animate(request, animation);
+  });
 }
 
 Status WritePicture(PictureRecord& picture, std::string_view destination,

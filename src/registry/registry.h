@@ -67,11 +67,15 @@ void RunFormatShutdown();  // after the last picture
 
 // Opens and decodes what is asked for into a new record: finds its row, runs `info` and, for rows
 // that are not rendered, `read`. UnsupportedFormat (8) when no row matches, else the codec's own
-// status; `picture` is null unless Ok.
+// status; `picture` is null unless Ok. A file that the row of its name refuses is opened by the row
+// that its contents fit, as far as the request's IdentifyOptions let it; the record's `formatIndex`
+// is that row then. Where this fails too, the status is that of the row of the name.
 Status LoadPicture(const ReadRequest& request, PicturePointer& picture, void* window = nullptr);
 // The first half of it: a record with the facts of a file. FileOpenError (1) for a path over 260
 // characters.
 Status LoadPictureInfo(const ReadRequest& request, PicturePointer& picture);
+// Whether the record of a file has facts that a row of another format than its name's gave.
+bool OpenedByContents(const PictureRecord& picture);
 // The second half: decodes a page of the file that the record has the facts of. NoImages (20) when
 // the file has no such page, else the codec's own status; `image` and `alpha` are empty unless Ok.
 Status ReadPicture(const ReadRequest& request, PictureRecord& picture);

@@ -12,8 +12,8 @@ namespace {
 
 using namespace std::string_view_literals;
 
-// A signature and the extension of the row that means such files; none for files of kinds that the
-// registry does not have.
+// A signature and the extension of the row that means such files, or under which a plug-in may; none
+// for files that are not pictures.
 struct SignatureOfRow {
   std::string_view extension;
   Signature signature;
@@ -29,14 +29,14 @@ constexpr SignatureOfRow kWithoutCodec[] = {
     {"WAV",  {0, "RIFF"sv, "WAV", 8, "WAVE"sv}},
     {"ANI",  {0, "RIFF"sv, TrLater("an animated cursor"), 8, "ACON"sv}},
     {"CDR",  {0, "RIFF"sv, "CorelDRAW", 8, "CDR"sv}},
-    {"",     {4, "ftyp"sv, "AVIF", 8, "avif"sv}},
-    {"",     {4, "ftyp"sv, "AVIF", 8, "avis"sv}},
-    {"",     {4, "ftyp"sv, "HEIC", 8, "heic"sv}},
-    {"",     {4, "ftyp"sv, "HEIC", 8, "heix"sv}},
-    {"",     {4, "ftyp"sv, "HEIC", 8, "hevc"sv}},
-    {"",     {4, "ftyp"sv, "HEIF", 8, "mif1"sv}},
-    {"",     {4, "ftyp"sv, "HEIF", 8, "msf1"sv}},
-    {"",     {4, "ftyp"sv, "Canon CR3", 8, "crx "sv}},
+    {"AVIF", {4, "ftyp"sv, "AVIF", 8, "avif"sv}},
+    {"AVIF", {4, "ftyp"sv, "AVIF", 8, "avis"sv}},
+    {"HEIC", {4, "ftyp"sv, "HEIC", 8, "heic"sv}},
+    {"HEIC", {4, "ftyp"sv, "HEIC", 8, "heix"sv}},
+    {"HEIC", {4, "ftyp"sv, "HEIC", 8, "hevc"sv}},
+    {"HEIF", {4, "ftyp"sv, "HEIF", 8, "mif1"sv}},
+    {"HEIF", {4, "ftyp"sv, "HEIF", 8, "msf1"sv}},
+    {"CR3",  {4, "ftyp"sv, "Canon CR3", 8, "crx "sv}},
     {"MOV",  {4, "ftyp"sv, "QuickTime", 8, "qt  "sv}},
     {"MP4",  {4, "ftyp"sv, "MP4"}},
     {"M4V",  {4, "ftyp"sv}},
@@ -45,22 +45,22 @@ constexpr SignatureOfRow kWithoutCodec[] = {
     {"MPG",  {4, "ftyp"sv}},
     {"MOV",  {4, "moov"sv, "QuickTime"}},
     {"MOV",  {4, "mdat"sv, "QuickTime"}},
-    {"",     {0, "\0\0\0\x0cJXL \r\n\x87\n"sv, "JPEG XL"}},
-    {"",     {0, "\0\0\0\x0cjP  \r\n\x87\n"sv, "JPEG 2000"}},
-    {"",     {0, "\xff\x4f\xff\x51"sv, "JPEG 2000"}},
-    {"",     {0, "II\x2a\0"sv, "Canon CR2", 8, "CR"sv}},
+    {"JXL",  {0, "\0\0\0\x0cJXL \r\n\x87\n"sv, "JPEG XL"}},
+    {"JP2",  {0, "\0\0\0\x0cjP  \r\n\x87\n"sv, "JPEG 2000"}},
+    {"JP2",  {0, "\xff\x4f\xff\x51"sv, "JPEG 2000"}},
+    {"CR2",  {0, "II\x2a\0"sv, "Canon CR2", 8, "CR"sv}},
     {"KDC",  {0, "II\x2a\0"sv}},
     {"KDC",  {0, "MM\0\x2a"sv}},
-    {"",     {0, "8BPS\0\2"sv, "Photoshop PSB"}},
-    {"",     {0, "gimp xcf"sv, "GIMP XCF"}},
+    {"PSB",  {0, "8BPS\0\2"sv, "Photoshop PSB"}},
+    {"XCF",  {0, "gimp xcf"sv, "GIMP XCF"}},
     {"",     {0, "FORM"sv, TrLater("IFF animation"), 8, "ANIM"sv}},
-    {"",     {0, "qoif"sv, "QOI"}},
-    {"",     {0, "FLIF"sv, "FLIF"}},
-    {"",     {0, "icns"sv, TrLater("an Apple icon")}},
-    {"",     {0, "DDS "sv, "DDS"}},
-    {"",     {0, "\x76\x2f\x31\x01"sv, "OpenEXR"}},
-    {"",     {0, "#?RADIANCE"sv, "Radiance HDR"}},
-    {"",     {0, "%PDF-"sv, "PDF"}},
+    {"QOI",  {0, "qoif"sv, "QOI"}},
+    {"FLIF", {0, "FLIF"sv, "FLIF"}},
+    {"ICNS", {0, "icns"sv, TrLater("an Apple icon")}},
+    {"DDS",  {0, "DDS "sv, "DDS"}},
+    {"EXR",  {0, "\x76\x2f\x31\x01"sv, "OpenEXR"}},
+    {"HDR",  {0, "#?RADIANCE"sv, "Radiance HDR"}},
+    {"PDF",  {0, "%PDF-"sv, "PDF"}},
     {"EPS",  {0, "%!PS"sv, "PostScript"}},
     {"EPS",  {0, "\xc5\xd0\xd3\xc6"sv, "EPS"}},
     {"FPX",  {0, "\xd0\xcf\x11\xe0\xa1\xb1\x1a\xe1"sv, TrLater("a compound file")}},
@@ -100,21 +100,21 @@ constexpr SignatureOfRow kWithoutCodec[] = {
     {"",     {0, "ttcf"sv, TrLater("a TrueType collection")}},
     {"",     {0, "wOFF"sv, TrLater("a web font")}},
     {"",     {0, "wOF2"sv, TrLater("a web font")}},
-    {"",     {0, "<svg"sv, "SVG"}},
+    {"SVG",  {0, "<svg"sv, "SVG"}},
     {"",     {0, "<?xml"sv, "XML"}},
     {"",     {0, "<!DOCTYPE html"sv, "HTML"}},
     {"",     {0, "<!doctype html"sv, "HTML"}},
     {"",     {0, "<html"sv, "HTML"}},
-    {"",     {0, "/* XPM */"sv, "XPM"}},
+    {"XPM",  {0, "/* XPM */"sv, "XPM"}},
     {"UUE",  {0, "begin "sv, "UUE"}},
-    {"",     {0, "P1\n"sv, "PBM"}},
-    {"",     {0, "P2\n"sv, "PGM"}},
-    {"",     {0, "P3\n"sv, "PPM"}},
-    {"",     {0, "P4\n"sv, "PBM"}},
-    {"",     {0, "P5\n"sv, "PGM"}},
-    {"",     {0, "P6\n"sv, "PPM"}},
-    {"",     {0, "P7\n"sv, "PAM"}},
-    {"",     {0, "\xff\x0a"sv, "JPEG XL"}},
+    {"PBM",  {0, "P1\n"sv, "PBM"}},
+    {"PGM",  {0, "P2\n"sv, "PGM"}},
+    {"PPM",  {0, "P3\n"sv, "PPM"}},
+    {"PBM",  {0, "P4\n"sv, "PBM"}},
+    {"PGM",  {0, "P5\n"sv, "PGM"}},
+    {"PPM",  {0, "P6\n"sv, "PPM"}},
+    {"PAM",  {0, "P7\n"sv, "PAM"}},
+    {"JXL",  {0, "\xff\x0a"sv, "JPEG XL"}},
     {"PIC",  {0, "BM"sv, {}, 6, "\0\0\0\0"sv}},
     {"KQP",  {0, "BM"sv, {}, 6, "\0\0\0\0"sv}},
     {"EXE",  {0, "MZ"sv, TrLater("a program")}},
@@ -184,6 +184,15 @@ FileKind IdentifyFile(const std::string& fileName) {
   platform::FileView file;
   if (!file.OpenHead(fileName.c_str(), kSignatureBytes)) return {};
   return IdentifySignature(file.Bytes());
+}
+
+FileKind KindBehindName(const std::string& fileName, int32_t formatIndex) {
+  FileKind kind = IdentifyFile(fileName);
+  if (formatIndex == kNoFormat) return kind;
+  const FormatEntry& row = FormatRow(formatIndex);
+  // Targa files have no signature, and the first bytes of many are those of an icon or a cursor.
+  const bool chance = row.signatures.empty() && (kind.IsOf("CUR") || kind.IsOf("ICO"));
+  return chance || kind.IsOf(row.extension) ? FileKind() : kind;
 }
 
 }  // namespace fotomill

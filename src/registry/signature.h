@@ -13,7 +13,7 @@ namespace fotomill {
 struct FileKind {
   // as people call the format: "AVIF"; empty when nothing fits
   std::string_view name;
-  // of the registry's rows that mean such files, the likeliest first
+  // of the registry's rows and of plug-ins that mean such files, the likeliest first
   std::vector<std::string_view> extensions;
   bool IsOf(std::string_view extension) const;
 };
@@ -25,5 +25,8 @@ inline constexpr size_t kSignatureBytes = 32;  // so many from the start of a fi
 FileKind IdentifySignature(std::span<const uint8_t> head);
 // The same for a file; nothing fits when it cannot be opened.
 FileKind IdentifyFile(const std::string& fileName);
+// What a file is whose name selects row `formatIndex` (kNoFormat: none) and lies; nothing when the
+// contents are what the name says, or tell nothing.
+FileKind KindBehindName(const std::string& fileName, int32_t formatIndex);
 
 }  // namespace fotomill

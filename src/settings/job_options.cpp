@@ -29,7 +29,10 @@ Dither DitherFromKey(int32_t value) {
 ReadOptions ReadOptionsFromSettings() {
   return {.alphaChannels = settings.UseAlphaChannels != 0,
           .recognizeApng = settings.RecognizeAPNG != 0,
-          .alphaBackground = static_cast<uint32_t>(settings.AlphaBackground)};
+          .alphaBackground = static_cast<uint32_t>(settings.AlphaBackground),
+          .identify = {.on = settings.IdentifyMysteryViewFiles != 0,
+                       .exceptions = std::string(settings.BatchIdentifyExceptions),
+                       .mostSide = settings.MaximumMysteryFileDimension}};
 }
 
 EncodeOptions EncodeOptionsFromSettings() {

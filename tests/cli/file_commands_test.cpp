@@ -222,6 +222,46 @@ TEST_F(FileCommands, VerifyDecodesWhatInfoOnlyLooksAt) {
   EXPECT_TRUE(result.Says(In("cut.bmp") + ": File read error.")) << result.err;
 }
 
+// Every command opens a picture whose name lies, and tells what it is.
+TEST_F(FileCommands, OpensFilesWhoseNamesLie) {
+  ASSERT_EQ(RunCommand({"convert", In("a.bmp"), "--to", "jpg", "--out", In("made.jpg")}).status, 0);
+  fs::rename(In("made.jpg"), In("photo.png"));
+  const json facts = json::parse(RunCommand({"info", "--json", In("photo.png")}).out)[0];
+  EXPECT_EQ(facts["status"], 0);
+  EXPECT_EQ(facts["format"], "JPG");
+  EXPECT_EQ(facts["looksLike"], "JPEG");
+  const json honest = json::parse(RunCommand({"info", "--json", In("a.bmp")}).out)[0];
+  EXPECT_FALSE(honest.contains("looksLike"));
+  EXPECT_THAT(RunCommand({"info", In("photo.png")}).out, HasSubstr("The contents are JPG"));
+  EXPECT_EQ(RunCommand({"verify", In("photo.png")}).status, 0);
+  EXPECT_EQ(RunCommand({"convert", In("photo.png"), "--to", "bmp"}).status, 0);
+  EXPECT_EQ(ReadBytes(In("photo.bmp")).size(), BitmapFile(5, 3, 24).size());
+  EXPECT_EQ(RunCommand({"thumbs", "draw", In("photo.png"), "--side", "4", "--out", In("t.bmp")}).status, 0);
+  const CommandResult off = RunCommand({"--set", "IdentifyMysteryViewFiles=0", "info", In("photo.png")});
+  EXPECT_EQ(off.status, 1);
+  EXPECT_THAT(off.err, HasSubstr("Damaged file. It looks like JPEG."));
+}
+
+TEST_F(FileCommands, MatchLooksIntoFiles) {
+  ASSERT_EQ(RunCommand({"convert", In("a.bmp"), "--to", "jpg", "--out", In("made.jpg")}).status, 0);
+  fs::copy(In("made.jpg"), In("made.scr"));
+  fs::copy(In("made.jpg"), In("made"));
+  WriteText(In("photo.avif"), std::string("\0\0\0\x1c", 4) + "ftypavif....");
+  const CommandResult text = RunCommand({"match", "--contents", In("made.scr"), In("made"), In("a.bmp"), In("photo.avif"), In("none.bmp")});
+  EXPECT_EQ(text.status, 1);
+  EXPECT_EQ(text.out, In("made.scr") + ": JPG, (JPG) Jpeg, by its contents; its name selects SCR\n" +
+                          In("made") + ": JPG, (JPG) Jpeg, by its contents; its name selects no format\n" +
+                          In("a.bmp") + ": BMP, (BMP) Windows bitmap, by its extension\n");
+  EXPECT_THAT(text.err, HasSubstr("It looks like AVIF."));
+  const json array = json::parse(RunCommand({"match", "--contents", "--json", In("made.scr"), In("photo.avif")}).out);
+  EXPECT_EQ(array[0]["extension"], "SCR");
+  EXPECT_EQ(array[0]["contentsExtension"], "JPG");
+  EXPECT_EQ(array[0]["contentsIndex"], 15);
+  EXPECT_EQ(array[0]["status"], 0);
+  EXPECT_EQ(array[1]["contentsIndex"], -1);
+  EXPECT_EQ(array[1]["looksLike"], "AVIF");
+}
+
 TEST(MatchCommand, TellsTheRowAndTheRule) {
   const CommandResult text = RunCommand({"match", "scan.tiff", "x.bmp", "odd.abc"});
   EXPECT_EQ(text.status, 1);

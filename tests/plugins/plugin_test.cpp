@@ -309,6 +309,24 @@ TEST_F(Plugins, OnePluginFormatConvertsToAnother) {
   EXPECT_EQ(test::ReadText(folder_.Path("c.ppm")), "P6\n2 1\n255\n\x01\x02\x03\xff\xfe\xfd");
 }
 
+TEST_F(Plugins, FilesWhoseNamesLieAreOpenedByTheirContents) {
+  EnablePlugins(SAMPLE_MODULES);
+  const char* const contents = "P6\n2 1\n255\n\x01\x02\x03\xff\xfe\xfd";
+  for (const char* const name : {"a.bmp", "a.pgmx", "a"}) {
+    SCOPED_TRACE(name);
+    test::WriteText(folder_.Path(name), contents);
+    PicturePointer picture;
+    ASSERT_EQ(LoadPicture({.fileName = folder_.Path(name)}, picture), Status::Ok);
+    EXPECT_EQ(picture->formatIndex, kSpareRow);
+    EXPECT_TRUE(OpenedByContents(*picture));
+    EXPECT_EQ(picture->image.PixelAt(0, 0), 0x010203);
+  }
+  test::WriteText(folder_.Path("a.ppm"), contents);
+  PicturePointer picture;
+  ASSERT_EQ(LoadPicture({.fileName = folder_.Path("a.ppm")}, picture), Status::Ok);
+  EXPECT_FALSE(OpenedByContents(*picture));
+}
+
 TEST_F(Plugins, ListsShowPluginFormatsBehindTheRows) {
   EnablePlugins(SAMPLE_MODULES);
   const auto filter = OpenFileFilter();

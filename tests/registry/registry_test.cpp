@@ -210,6 +210,61 @@ TEST(LoadPicture, NoRecordWithoutAPicture) {
   EXPECT_EQ(ReadPicture({}, *NewPictureRecord()), Status::UnsupportedFormat);
 }
 
+// A picture of 3 x 2 pixels under a name of another format.
+TEST(LoadPicture, OpensByContentsWhatTheNameHides) {
+  const TemporaryFolder folder;
+  const auto write = [&](const char* extension, const std::string& name) {
+    const PicturePointer picture = MakePicture(3, 2, 8);
+    const std::string made = folder.Path(std::string("made.") + extension);
+    ASSERT_EQ(WritePicture(*picture, made, {}), Status::Ok);
+    WriteBytes(folder.Path(name), ReadBytes(made));
+  };
+  const struct {
+    const char* made;
+    const char* name;
+    IdentifyOptions identify;
+    Status status;
+    const char* row = "";
+  } rows[] = {
+      {"jpg", "photo.png", {}, Status::Ok, "JPG"},
+      {"jpg", "photo.avi", {}, Status::Ok, "JPG"},  // no codec of the name's row
+      {"png", "photo.hrz", {}, Status::Ok, "PNG"},  // its row refuses by another status
+      {"gif", "noextension", {}, Status::Ok, "GIF"},
+      {"tif", "photo.xyz", {}, Status::Ok, "TIF"},
+      {"bmp", "photo.dib", {}, Status::Ok, "DIB"},  // no lie: the row of the name reads it
+      {"jpg", "photo.png", {.on = false}, Status::DamagedFile},
+      {"jpg", "photo.png", {.exceptions = "EXE;PNGX;;pNg"}, Status::DamagedFile},
+      {"jpg", "photo.png", {.exceptions = "PN;PNGX;"}, Status::Ok, "JPG"},
+      {"jpg", "photo.scr", {}, Status::UnsupportedFunction},
+      {"jpg", "photo.png", {.mostSide = 2}, Status::DamagedFile},
+      {"jpg", "photo.png", {.mostSide = 3}, Status::Ok, "JPG"},
+      {"png", "photo.png", {.mostSide = 2}, Status::Ok, "PNG"},  // the limit is for lies alone
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    write(row.made, row.name);
+    const ReadRequest request{.fileName = folder.Path(row.name), .options = {.identify = row.identify}};
+    PicturePointer picture;
+    EXPECT_EQ(LoadPicture(request, picture), row.status);
+    ASSERT_EQ(picture != nullptr, row.status == Status::Ok);
+    if (picture == nullptr) continue;
+    EXPECT_EQ(picture->image.Width(), 3);
+    EXPECT_EQ(FormatRow(picture->formatIndex).extension.view(), row.row);
+    EXPECT_EQ(OpenedByContents(*picture), picture->formatIndex != FindFormatByName(row.name));
+  }
+}
+
+TEST(LoadPicture, ContentsThatFitNothingLeaveTheStatusOfTheName) {
+  const TemporaryFolder folder;
+  WriteText(folder.Path("cut.png"), "\xff\xd8\xff");
+  WriteText(folder.Path("photo.pcx"), std::string("\0\0\0\x1c", 4) + "ftypavif....");
+  WriteText(folder.Path("x.abc"), std::string("\0\0\0\x1c", 4) + "ftypavif....");
+  PicturePointer picture;
+  EXPECT_EQ(LoadPicture({.fileName = folder.Path("cut.png")}, picture), Status::DamagedFile);
+  EXPECT_EQ(LoadPicture({.fileName = folder.Path("photo.pcx")}, picture), Status::DamagedFile);
+  EXPECT_EQ(LoadPicture({.fileName = folder.Path("x.abc")}, picture), Status::UnsupportedFormat);
+}
+
 // The rows that loops and codecs rely on.
 TEST(Registry, RowsKeepTheirPromises) {
   for (int32_t i = 0; i < formatCount; ++i) {

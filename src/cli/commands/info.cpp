@@ -34,7 +34,9 @@ std::string Resolution(double pixelsPerInch) {
 void AddFrames(const PictureRecord& picture, Json& facts) {
   AnimationPointer animation;
   if (picture.pageCount < 2 ||
-      OpenAnimation({.fileName = picture.fileName.c_str()}, animation) != Status::Ok)
+      OpenAnimation(
+          {.fileName = picture.fileName.c_str(), .options = ReadOptionsFromSettings()}, animation) !=
+          Status::Ok)
     return;
   facts["delaysMs"] = animation->Delays();
   facts["rounds"] = animation->Rounds();
@@ -75,6 +77,8 @@ std::string FactsAsText(const PictureRecord& picture) {
   const FormatEntry& row = FormatRow(picture.formatIndex);
   std::string text;
   AddFact(text, Tr("Format"), row.description.view());
+  if (const std::string remark = MisnamedRemark(picture); !remark.empty())
+    AddFact(text, Tr("Remark"), remark);
   if (!picture.typeName.empty()) AddFact(text, Tr("Type"), picture.typeName.view());
   AddFact(text, Tr("Dimensions"), Tr("%1 x %2 pixels", picture.width, picture.height));
   const std::string depth =
@@ -113,9 +117,8 @@ void ReportFile(const SelectedFile& file, ResultOutput& output, UsedFiles& used)
     Json element;
     PutName(element, "file", file.name);
     PutStatus(element, status);
-    if (status == Status::Ok) {
-      element.update(FactsAsJson(*picture));
-    } else if (file.status == Status::Ok) {
+    if (status == Status::Ok) element.update(FactsAsJson(*picture));
+    if (status == Status::Ok ? OpenedByContents(*picture) : file.status == Status::Ok) {
       const std::string_view looksLike = LooksLike(file.name, FindFormatByName(file.name));
       if (!looksLike.empty()) element["looksLike"] = looksLike;
     }

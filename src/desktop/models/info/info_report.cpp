@@ -80,6 +80,8 @@ void AddPictureFacts(const PictureRecord& picture, const InfoOptions& options, F
   info.height = picture.height;
   info.imageBytes = picture.imageBytes;
   general.lines.push_back({Tr("Format"), info.format});
+  if (std::string remark = MisnamedRemark(picture); !remark.empty())
+    general.lines.push_back({Tr("Remark"), std::move(remark)});
   if (!picture.typeName.empty())
     general.lines.push_back({Tr("Type"), std::string(picture.typeName.view())});
   general.lines.push_back({Tr("Dimensions"), PixelsText(picture.width, picture.height)});

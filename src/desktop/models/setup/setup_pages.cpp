@@ -121,6 +121,8 @@ constexpr SetupItem kItems[] = {
     Item(History,    TrLater("List"),               FileHistoryListRuleEnable,      "Lines between rows"),
     Item(History,    TrLater("List"),               FileHistoryRemovePrompt,        "Ask before removing entries"),
     Item(History,    TrLater("File"),               FileHistoryDatabase,            "Name of the history file"),
+    Item(Formats,    TrLater("Wrong names"),        IdentifyMysteryViewFiles,       "Open files by their contents if the name is wrong"),
+    Item(Formats,    TrLater("Wrong names"),        BatchIdentifyExceptions,        "Except files with these extensions"),
     Item(Formats,    TrLater("Plug-ins"),           AllowPluginFormatOverride,      "Plug-ins may replace disabled formats"),
 };
 // clang-format on
