@@ -3,6 +3,7 @@
 #include <cstdint>
 #include <string>
 
+#include "core/choice_lists.h"
 #include "core/progress.h"
 #include "core/workers/stop_token.h"
 
@@ -25,6 +26,8 @@ struct ReadOptions {
   // AlphaBackground, 0x00BBGGRR: what the record's `defaultColour` becomes
   uint32_t alphaBackground = 0xffffff;
   IdentifyOptions identify = {};
+  // PhotoCDResolution: the largest size that is taken out of a Photo CD file
+  int32_t photoCdSize = choice::kPhotoCd3072;
   bool operator==(const ReadOptions&) const = default;
 };
 

@@ -32,7 +32,8 @@ ReadOptions ReadOptionsFromSettings() {
           .alphaBackground = static_cast<uint32_t>(settings.AlphaBackground),
           .identify = {.on = settings.IdentifyMysteryViewFiles != 0,
                        .exceptions = std::string(settings.BatchIdentifyExceptions),
-                       .mostSide = settings.MaximumMysteryFileDimension}};
+                       .mostSide = settings.MaximumMysteryFileDimension},
+          .photoCdSize = settings.PhotoCDResolution};
 }
 
 EncodeOptions EncodeOptionsFromSettings() {
