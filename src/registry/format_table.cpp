@@ -53,7 +53,7 @@ constexpr Place kPlaces[] = {
     {"HRZ"},
     {"ICO"},
     {"IFF"},
-    {"IMG", "(IMG) GEM/Ventura", 1, 24, FMT_BITMAP},
+    {"IMG"},
     {"JPG"},
     {"LBM"},
     {"MAC"},

@@ -31,6 +31,7 @@ ROWS = [
     ("bga", "bmp-true-color.bmp", "bmptopnm"),
     ("bga", "bmp-256-colors.bmp", "bmptopnm"),
     ("bga", "bmp-mono.bmp", "bmptopnm"),
+    ("img", "bmp-mono.bmp", "gemtopnm"),
 ]
 
 # The same for programs that are not always there and read a file: the command has its name for {}.
@@ -38,6 +39,9 @@ FILE_ROWS = [
     ("cut", "bmp-256-colors.bmp", "gm convert {} ppm:-"),
     ("cut", "bmp-16-colors.bmp", "gm convert {} ppm:-"),
     ("cut", "bmp-mono.bmp", "gm convert {} ppm:-"),
+    ("img", "bmp-true-color.bmp", "ffmpeg -v error -i {} -f image2pipe -c:v ppm -"),
+    ("img", "bmp-256-colors.bmp", "ffmpeg -v error -i {} -f image2pipe -c:v ppm -"),
+    ("img", "bmp-16-colors.bmp", "ffmpeg -v error -i {} -f image2pipe -c:v ppm -"),
 ]
 
 

@@ -1,0 +1,17 @@
+#pragma once
+
+#include "picture/picture_record.h"
+#include "picture/read_request.h"
+#include "picture/write_options.h"
+
+namespace fotomill {
+
+// GEM rasters. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when data are cut
+// short, MemoryAllocationError (6), UnsupportedFormat (8) for numbers of planes and color models
+// that are not read.
+Status GemInfo(PictureRecord& picture, const ReadRequest& request);
+Status GemRead(PictureRecord& picture, const ReadRequest& request);
+// Also UnsuitableImage (13) for sides above 65535, ErrorCreatingFile (10), ErrorWritingFile (11).
+Status GemWrite(PictureRecord& picture, const WriteOptions& options);
+
+}  // namespace fotomill
