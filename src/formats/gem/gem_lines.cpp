@@ -24,9 +24,9 @@ void PutPlain(std::span<const uint8_t> bytes, std::vector<uint8_t>& code) {
 
 // How many bytes from `x` on repeat the ones `unit` before them.
 size_t RepeatedBytes(std::span<const uint8_t> line, size_t x, size_t unit) {
-  const auto rest = line.subspan(std::min(x + unit, line.size()));
-  const auto before = line.subspan(x, rest.size());
-  return static_cast<size_t>(std::ranges::mismatch(rest, before).in1 - rest.begin());
+  size_t next = x + unit;
+  while (next < line.size() && line[next] == line[next - unit]) ++next;
+  return next - x - unit;
 }
 
 }  // namespace
