@@ -56,7 +56,8 @@ void TryCodec(const char* extension, const uint8_t* data, size_t size) {
                              picture->image.Height() != described->height)) {
     std::abort();
   }
-  if (CanWrite(row)) Write(row.write, *picture, encode);
+  if (CanWrite(row) && row.limits.Allow(picture->image.Width(), picture->image.Height()))
+    Write(row.write, *picture, encode);
   Write(BmpWrite, *picture, encode);
 }
 

@@ -1,5 +1,6 @@
 #include "batch/output_target.h"
 
+#include "batch/job.h"
 #include "registry/registry.h"
 
 namespace fotomill {

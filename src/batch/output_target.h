@@ -4,9 +4,11 @@
 #include <functional>
 #include <string>
 
-#include "batch/job.h"
+#include "picture/picture_record.h"
 
 namespace fotomill {
+
+struct BatchJob;
 
 // One of the outputs that a function makes of every file. What it leaves open is as the job says.
 struct BatchOutput {

@@ -1,6 +1,7 @@
 #include "batch/output_writer.h"
 
 #include "batch/fit_picture.h"
+#include "batch/picture_failure.h"
 #include "core/text.h"
 #include "metadata/exif/picture_exif.h"
 #include "platform/files.h"
@@ -119,6 +120,7 @@ std::string OutputWriter::Hint(const Destination& destination, Status status,
                                const PictureRecord& picture, const OutputTarget& target) const {
   if (status == Status::TooManyColors)
     return Reduces(target) ? std::string() : function_.reduceHint;
+  if (status == Status::UnsuitableImage) return SizeHint(picture, FormatRow(target.formatIndex));
   const std::string& path = destination.path;
   const std::string folder = platform::FolderOf(path);
   if (status == Status::ErrorWritingFile && !platform::SystemReason().empty())

@@ -37,4 +37,11 @@ std::string OpenHint(const std::string& fileName, Status status) {
                                              : std::string();
 }
 
+std::string SizeHint(const PictureRecord& picture, const FormatEntry& row) {
+  if (row.limits.Allow(picture.image.Width(), picture.image.Height())) return {};
+  const char* text = row.limits.exact ? TrLater("The format only holds pictures of %1 x %2 pixels.")
+                                      : TrLater("The format holds at most %1 x %2 pixels.");
+  return Tr(text, row.limits.width, row.limits.height);
+}
+
 }  // namespace fotomill

@@ -7,6 +7,7 @@
 
 namespace fotomill {
 
+struct FormatEntry;
 struct PictureRecord;
 
 // What a file looks like by its first bytes ("AVIF"), where that is not what its name says; empty
@@ -19,5 +20,8 @@ std::string MisnamedRemark(const PictureRecord& picture);
 // what the build lacks, or which format its name should have selected. Empty when there is nothing
 // to add.
 std::string OpenHint(const std::string& fileName, Status status);
+
+// What size pictures of the row can have, if this one does not fit; empty if it does.
+std::string SizeHint(const PictureRecord& picture, const FormatEntry& row);
 
 }  // namespace fotomill

@@ -14,6 +14,10 @@
 #include "picture/write_options.h"
 #include "texts/texts.h"
 
+namespace fotomill::platform {
+struct ApartTask;
+}
+
 namespace fotomill {
 
 // Capability bits of a format row.
@@ -59,6 +63,17 @@ using AnimateOperation = Status (*)(const ReadRequest& request, AnimationPointer
 using LifeOperation = int32_t (*)();  // once for each run of the program
 // Modal over the parent window.
 using OptionsOperation = int32_t (*)(void* parentWindow, int32_t parameter);
+
+// How large a picture `write` makes, in pixels.
+struct WriterLimits {
+  int32_t width = INT32_MAX;
+  int32_t height = INT32_MAX;
+  bool exact = false;  // no other size either
+  constexpr bool Allow(int32_t pictureWidth, int32_t pictureHeight) const {
+    return exact ? pictureWidth == width && pictureHeight == height
+                 : pictureWidth <= width && pictureHeight <= height;
+  }
+};
 
 // What files of a format begin with: one text, and where that says too little a second one further
 // on.
@@ -109,7 +124,10 @@ struct FormatEntry {
   LifeOperation startup = nullptr;
   LifeOperation shutdown = nullptr;
   uint32_t reserved = 0;
-  uint32_t maxBits = 0;                // deepest picture that `write` takes, bits per pixel
+  // Deepest picture that `write` takes, bits per pixel, and the largest. The registry checks both
+  // before it calls `write`.
+  uint32_t maxBits = 0;
+  WriterLimits limits = {};
   PathText extension = {};             // upper case, without the dot
   PathText description = {};           // as shown to the user
   int32_t enabled = 0;                 // the user's switch, 1 or 0
@@ -120,6 +138,9 @@ struct FormatEntry {
   bool canRead = false;          // `info` and `read` do their work in this build
   bool canWrite = false;         // so does `write`
   bool canStartUp = false;       // so does `startup`
+  bool writesPages = false;      // `write` can put several pictures into one file
+  // What `info` and `read` leave to a child process; null: they work in this one.
+  const platform::ApartTask* childTask = nullptr;
   // whether what the codec loads when it is needed is on this machine; null: nothing is
   bool (*present)() = nullptr;
   std::string_view whyNot = {};  // why the row cannot be read or cannot be written, in one sentence

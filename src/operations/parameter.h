@@ -110,6 +110,7 @@ class Arguments {
   // Nothing is given yet; the rows must outlive it.
   explicit Arguments(std::span<const Parameter> rows) : rows_(rows), values_(rows.size()) {}
 
+  // The parameters, in the order of the values.
   std::span<const Parameter> Rows() const { return rows_; }
   Value& At(size_t index) { return values_[index]; }
   const Value& At(size_t index) const { return values_[index]; }
@@ -120,6 +121,7 @@ class Arguments {
   double Number(std::string_view name) const { return Of(name).number; }
   // Cut toward zero.
   int32_t Integer(std::string_view name) const { return static_cast<int32_t>(Of(name).number); }
+  // False unless the flag was given.
   bool Flag(std::string_view name) const { return Of(name).choice != 0; }
   template <typename Enum = int32_t>
   Enum Choice(std::string_view name) const {

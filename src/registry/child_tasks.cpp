@@ -1,17 +1,22 @@
 #include "registry/child_tasks.h"
 
-#include "formats/hdphoto/hdp_codec.h"
+#include <algorithm>
+
+#include "registry/format_table.h"
 
 namespace fotomill {
 
-namespace {
-
-constexpr platform::ApartTask kChildTasks[] = {
-    {kHdpTask, DecodeHdpApart},
-};
-
-}  // namespace
-
-std::span<const platform::ApartTask> ChildTasks() { return kChildTasks; }
+std::vector<platform::ApartTask> ChildTasks() {
+  std::vector<const platform::ApartTask*> found;
+  for (const std::span<const FormatEntry> family : FormatFamilies()) {
+    for (const FormatEntry& row : family) {
+      if (row.childTask != nullptr && std::ranges::find(found, row.childTask) == found.end())
+        found.push_back(row.childTask);
+    }
+  }
+  std::vector<platform::ApartTask> tasks;
+  for (const platform::ApartTask* task : found) tasks.push_back(*task);
+  return tasks;
+}
 
 }  // namespace fotomill

@@ -1,12 +1,12 @@
 #pragma once
 
-#include <span>
+#include <vector>
 
 #include "platform/work_apart.h"
 
 namespace fotomill {
 
-// The work that the program has done by processes apart: one row each.
-std::span<const platform::ApartTask> ChildTasks();
+// What codecs leave to child processes, as their rows say; each task once.
+std::vector<platform::ApartTask> ChildTasks();
 
 }  // namespace fotomill

@@ -132,6 +132,8 @@ Status WritePictureAs(PictureRecord& picture, std::string_view destination, int3
   if ((row.flags & FMT_ALPHA) == 0) RETURN_IF_BAD(FlattenAlpha(picture));
   // flattened palette pictures
   if (picture.bitsPerPixel > static_cast<int32_t>(row.maxBits)) return Status::TooManyColors;
+  if (!row.limits.Allow(picture.image.Width(), picture.image.Height()))
+    return Status::UnsuitableImage;
   picture.workName = picture.fileName;
   picture.fileName.AssignCut(destination);
   picture.lostMetadata = static_cast<uint8_t>(kAllMetadata & ~row.keepsMetadata);

@@ -88,7 +88,8 @@ Status OpenAnimation(const ReadRequest& request, AnimationPointer& animation);
 // Writes a picture to `destination` in the format of its extension. UnsupportedFormat (8) when no
 // row matches, TooManyColors (12) when the picture is deeper than the row takes,
 // UnsupportedFunction (5) when the row cannot write, EmptyImage (31) for a record without a
-// picture, InvalidDestination (29) for a path over 260 characters, else the codec's own status.
+// picture, InvalidDestination (29) for a path over 260 characters, UnsuitableImage (13) when the
+// row's files cannot be that large or that small, else the codec's own status.
 // Alpha that the format cannot hold is flattened first. The picture stays the caller's.
 Status WritePicture(PictureRecord& picture, std::string_view destination,
                     const WriteOptions& options);

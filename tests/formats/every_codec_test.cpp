@@ -41,9 +41,6 @@ constexpr Keeping kKeepings[] = {
 };
 // clang-format on
 
-// Whether files of the format hold pictures of 256 x 240 pixels only.
-bool HoldsOneSize(const FormatEntry& row) { return row.extension.view() == "HRZ"; }
-
 Keeps KeepsOf(const FormatEntry& row) {
   for (const Keeping& keeping : kKeepings) {
     if (keeping.extension == row.extension.view()) return keeping.keeps;
@@ -142,7 +139,7 @@ TEST(EveryCodec, ReadsBackWhatItWrote) {
     const std::string path = folder.Path("picture." + LowerCase(row.extension.view()));
     for (const int32_t bits : {1, 2, 3, 4, 5, 6, 7, 8, 24}) {
       for (const int32_t width : {1, 3, 7, 8, 9, 33, 130}) {
-        if (bits > static_cast<int32_t>(row.maxBits) || HoldsOneSize(row)) continue;
+        if (bits > static_cast<int32_t>(row.maxBits) || row.limits.exact) continue;
         SCOPED_TRACE(std::to_string(bits) + " bits, width " + std::to_string(width));
         const PicturePointer picture = PatternPicture(width, 35, bits);
         picture->fileName.AssignCut(path);
@@ -170,6 +167,40 @@ TEST(EveryCodec, ReadsBackWhatItWrote) {
           EXPECT_EQ(Difference(picture->image, back->image), "");
         }
       }
+    }
+  });
+}
+
+TEST(EveryCodec, WritesUpToTheLimitsOfItsRow) {
+  ForEachRow(true, [&](const FormatEntry& row) {
+    const WriterLimits& limits = row.limits;
+    if (limits.width == INT32_MAX) return;
+    const int32_t one = limits.exact ? limits.width : 1, other = limits.exact ? limits.height : 1;
+    const struct {
+      int32_t width, height;
+      Status status;
+    } sizes[] = {
+        {limits.width, other, Status::Ok},
+        {one, limits.height, Status::Ok},
+        {limits.width + 1, other, Status::UnsuitableImage},
+        {one, limits.height + 1, Status::UnsuitableImage},
+        {limits.width - 1, other, limits.exact ? Status::UnsuitableImage : Status::Ok},
+        {one, limits.height - 1, limits.exact ? Status::UnsuitableImage : Status::Ok},
+    };
+    for (const auto& size : sizes) {
+      SCOPED_TRACE(std::to_string(size.width) + " x " + std::to_string(size.height));
+      const TemporaryFolder folder;
+      const std::string path = folder.Path("picture." + LowerCase(row.extension.view()));
+      const PicturePointer picture = PatternPicture(size.width, size.height, 1);
+      // of one color, so that no code of a row is too long
+      for (int32_t y = 0; y < size.height; ++y) std::ranges::fill(picture->image.Row(y), 0);
+      ASSERT_EQ(WritePicture(*picture, path, {}), size.status);
+      ASSERT_EQ(fs::exists(path), size.status == Status::Ok);
+      if (size.status != Status::Ok) continue;
+      const PicturePointer back = NewPictureRecord();
+      ASSERT_EQ(row.read(*back, RequestFor(path)), Status::Ok);
+      EXPECT_EQ(back->image.Width(), size.width);
+      EXPECT_EQ(back->image.Height(), size.height);
     }
   });
 }
@@ -287,8 +318,8 @@ TEST(EveryCodec, FailedWriteLeavesTheDestinationAlone) {
     const TemporaryFolder folder;
     const std::string name = "picture." + LowerCase(row.extension.view());
     const PicturePointer picture =
-        PatternPicture(HoldsOneSize(row) ? 256 : 33, HoldsOneSize(row) ? 240 : 20,
-                       static_cast<int32_t>(row.maxBits));
+        PatternPicture(row.limits.exact ? row.limits.width : 33,
+                       row.limits.exact ? row.limits.height : 20, static_cast<int32_t>(row.maxBits));
     picture->fileName.AssignCut(folder.Path(name));
     const int64_t faults = ForEachFault([&] {
       WriteText(folder.Path(name), "old");

@@ -118,12 +118,5 @@ TEST(Webp, BrokenFilesFail) {
   EXPECT_EQ(Decode(WebpRead, foreign).status, Status::DamagedFile);
 }
 
-TEST(Webp, SidesBeyondTheFormatAreRefused) {
-  const PicturePointer picture = PatternPicture(16384, 1, 1);
-  Status status = Status::Ok;
-  EXPECT_TRUE(Encode(WebpWrite, *picture, &status).empty());
-  EXPECT_EQ(status, Status::UnsuitableImage);
-}
-
 }  // namespace
 }  // namespace fotomill::test

@@ -29,6 +29,11 @@ Json RowAsJson(int32_t index) {
   element["enabled"] = row.enabled != 0;
   element["flags"] = row.flags;
   element["maxBits"] = row.maxBits;
+  if (row.limits.width < INT32_MAX) element["maxWidth"] = row.limits.width;
+  if (row.limits.height < INT32_MAX) element["maxHeight"] = row.limits.height;
+  if (row.limits.exact) element["exactSize"] = true;
+  element["writesPages"] = row.writesPages;
+  element["childProcess"] = row.childTask != nullptr;
   element["details"] = row.details != nullptr;
   element["options"] = row.options != nullptr;
   element["startup"] = row.canStartUp;

@@ -3,8 +3,6 @@
 #include <atomic>
 #include <memory>
 
-#include "platform/process.h"
-
 namespace fotomill {
 
 // Asked by work now and then: whether its result is still wanted. Copies ask the same source, and
@@ -13,10 +11,7 @@ class StopToken {
  public:
   StopToken() = default;  // of no source: only the end of the program stops its work
   // Whether the source was stopped, or the program was asked to end (Ctrl-C, the system's request).
-  bool Asked() const {
-    return (stopped_ != nullptr && stopped_->load(std::memory_order_relaxed)) ||
-           platform::PendingExit() != 0;
-  }
+  bool Asked() const;
 
  private:
   friend class StopSource;

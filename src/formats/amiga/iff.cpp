@@ -36,6 +36,7 @@
 #include "formats/amiga/iff_planes.h"
 #include "platform/file_view.h"
 #include "processing/pixel_rows.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -198,7 +199,7 @@ void DescribePicture(const IffFile& file, PictureRecord& picture) {
     SetPalette(file, picture.palette);
   }
   if (file.changesColors)
-    picture.warning.AssignCut("Colors that change from row to row are not shown.");
+    picture.warning.AssignCut(TrLater("Colors that change from row to row are not shown."));
 }
 
 // Stores indices of one byte at the image's depth.

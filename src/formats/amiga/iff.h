@@ -11,7 +11,8 @@ namespace fotomill {
 // for other kinds of bitmaps and compressions, NoImages (20) for a file without pixels.
 Status IffInfo(PictureRecord& picture, const ReadRequest& request);
 Status IffRead(PictureRecord& picture, const ReadRequest& request);
-// Also UnsuitableImage (13) for sides over 65535, ErrorCreatingFile (10), ErrorWritingFile (11).
+// Also UnsuitableImage (13) for more than 4 GiB of data, ErrorCreatingFile (10), ErrorWritingFile
+// (11).
 // HamWrite makes HAM8 of 24 bits, and writes palette pictures as they are.
 Status IffWrite(PictureRecord& picture, const WriteOptions& options);
 Status HamWrite(PictureRecord& picture, const WriteOptions& options);

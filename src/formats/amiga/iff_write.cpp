@@ -203,7 +203,6 @@ Status Write(PictureRecord& picture, const WriteOptions& options, bool ham) {
   const ProgressScope progress(picture);
   const PackedImage& image = picture.image;
   if (image.Empty()) return Status::MemoryAllocationError;
-  if (image.Width() > UINT16_MAX || image.Height() > UINT16_MAX) return Status::UnsuitableImage;
   IffLayout layout{.planes = image.Bits(),
                    .ham = ham && image.Bits() == 24,
                    .compressed = options.encode.iffCompressed};

@@ -28,6 +28,7 @@ constexpr FormatEntry Row(std::string_view extension, std::string_view descripti
           .read = IffRead,
           .write = write,
           .maxBits = maxBits,
+          .limits = {UINT16_MAX, UINT16_MAX},
           .extension = extension,
           .description = description,
           .enabled = 1,

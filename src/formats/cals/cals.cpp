@@ -32,7 +32,6 @@ namespace fotomill {
 namespace {
 
 constexpr size_t kHeaderSize = 2048, kRecordSize = 128;
-constexpr int32_t kMostPixels = 999999;  // six digits
 
 // The directions of pixels and rows, and how a picture stored so becomes upright.
 struct Direction {
@@ -171,7 +170,6 @@ Status CalsWrite(PictureRecord& picture, const WriteOptions& options) {
   const PackedImage& image = picture.image;
   if (image.Empty()) return Status::MemoryAllocationError;
   if (image.Bits() > 1) return Status::TooManyColors;
-  if (image.Width() > kMostPixels || image.Height() > kMostPixels) return Status::UnsuitableImage;
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
   const double dpi = picture.metadata.dpiX;

@@ -10,8 +10,8 @@ namespace fotomill {
 // are cut short, MemoryAllocationError (6), UnsupportedFormat (8) for tiled files.
 Status CalsInfo(PictureRecord& picture, const ReadRequest& request);
 Status CalsRead(PictureRecord& picture, const ReadRequest& request);
-// Also UnsuitableImage (13) for sizes over 999999, ErrorCreatingFile (10), ErrorWritingFile (11),
-// TooManyColors (12) for pictures deeper than 1 bit.
+// Also TooManyColors (12) for pictures deeper than 1 bit, ErrorCreatingFile (10), ErrorWritingFile
+// (11).
 Status CalsWrite(PictureRecord& picture, const WriteOptions& options);
 
 }  // namespace fotomill

@@ -15,6 +15,7 @@ constexpr FormatEntry Row(std::string_view extension) {
           .read = CalsRead,
           .write = CalsWrite,
           .maxBits = 1,
+          .limits = {999999, 999999},  // six digits
           .extension = extension,
           .description = "(CAL) CALS"sv,
           .enabled = 1,

@@ -15,6 +15,7 @@ constexpr FormatEntry kRows[] = {{
     .read = DcxRead,
     .write = DcxWrite,
     .maxBits = 24,
+    .limits = {UINT16_MAX + 1, UINT16_MAX + 1},
     .extension = "DCX"sv,
     .description = "(DCX) DCX FAX"sv,
     .enabled = 1,

@@ -180,8 +180,6 @@ Status CutWrite(PictureRecord& picture, const WriteOptions& options) {
   const ProgressScope progress(picture);
   if (picture.image.Empty()) return Status::MemoryAllocationError;
   if (picture.image.Bits() > 8) return Status::TooManyColors;
-  if (picture.image.Width() > UINT16_MAX || picture.image.Height() > UINT16_MAX)
-    return Status::UnsuitableImage;
   PackedImage deeper;
   if (picture.image.Bits() < 8) RETURN_IF_BAD(PromoteImage(picture.image, 8, deeper));
   const PackedImage& image = deeper.Empty() ? picture.image : deeper;

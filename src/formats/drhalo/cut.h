@@ -11,9 +11,9 @@ namespace fotomill {
 // that is missing or damaged leaves the picture gray; a damaged one is mentioned in `warning`.
 Status CutInfo(PictureRecord& picture, const ReadRequest& request);
 Status CutRead(PictureRecord& picture, const ReadRequest& request);
-// Writes both files or none. Also TooManyColors (12) above 8 bits, UnsuitableImage (13) for sides
-// and rows that do not fit their fields, ErrorCreatingFile (10) also when the palette's name
-// belongs to another file, ErrorWritingFile (11).
+// Writes both files or none. Also TooManyColors (12) above 8 bits, UnsuitableImage (13) for rows
+// that do not fit their fields, ErrorCreatingFile (10) also when the palette's name belongs to
+// another file, ErrorWritingFile (11).
 Status CutWrite(PictureRecord& picture, const WriteOptions& options);
 
 }  // namespace fotomill

@@ -13,6 +13,7 @@ constexpr FormatEntry kRows[] = {{
     .read = CutRead,
     .write = CutWrite,
     .maxBits = 8,
+    .limits = {UINT16_MAX, UINT16_MAX},
     .extension = "CUT"sv,
     .description = "(CUT) Dr. Halo"sv,
     .enabled = 1,

@@ -12,8 +12,7 @@ namespace fotomill {
 // of the request selects a frame, which is shown on what the frames before it left on the screen.
 Status GifInfo(PictureRecord& picture, const ReadRequest& request);
 Status GifRead(PictureRecord& picture, const ReadRequest& request);
-// Also UnsuitableImage (13) for sizes over 65535, TooManyColors (12) for 24-bit pictures,
-// ErrorCreatingFile (10), ErrorWritingFile (11).
+// Also TooManyColors (12) for 24-bit pictures, ErrorCreatingFile (10), ErrorWritingFile (11).
 Status GifWrite(PictureRecord& picture, const WriteOptions& options);
 Status GifDetails(PictureRecord& picture);
 Status GifAnimate(const ReadRequest& request, AnimationPointer& animation);

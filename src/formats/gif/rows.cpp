@@ -25,6 +25,7 @@ constexpr FormatEntry kRows[] = {{
     .read = GifRead,
     .write = GifWrite,
     .maxBits = 8,
+    .limits = {UINT16_MAX, UINT16_MAX},
     .extension = "GIF"sv,
     .description = "(GIF) CompuServe"sv,
     .enabled = 1,

@@ -254,7 +254,7 @@ Status DecodeHdp(const HdpPage& page, HdpRaster& raster, const std::function<voi
   const auto pixels =
       static_cast<uint64_t>(page.image.width) * static_cast<uint64_t>(page.image.height);
   const platform::ApartResult result = platform::RunApart(
-      {.task = kHdpTask,
+      {.task = kHdpTask.name,
        .request = {reinterpret_cast<const uint8_t*>(&request), sizeof request},
        .input = input.Bytes(),
        .reply = raster.block,

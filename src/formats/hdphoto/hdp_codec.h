@@ -41,8 +41,8 @@ bool CanDecodeHdp(const HdpStream& stream);
 Status DecodeHdp(const HdpPage& page, HdpRaster& raster, const std::function<void(int32_t)>& told);
 
 // The part of it that runs apart: a row of the program's table of such work.
-inline constexpr char kHdpTask[] = "hdp-decode";
 bool DecodeHdpApart(const platform::ApartCall& call);
+inline constexpr platform::ApartTask kHdpTask = {"hdp-decode", DecodeHdpApart};
 
 // How the library is to code a picture.
 struct HdpEncoding {

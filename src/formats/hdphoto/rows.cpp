@@ -1,6 +1,7 @@
 #include "formats/rows.h"
 
 #include "formats/hdphoto/hdp.h"
+#include "formats/hdphoto/hdp_codec.h"
 #include "texts/texts.h"
 
 namespace fotomill {
@@ -36,6 +37,7 @@ constexpr FormatEntry Row(std::string_view extension, std::string_view descripti
           .flags = flags,
           .canRead = true,
           .canWrite = true,
+          .childTask = &kHdpTask,
           .present = HdpWorksHere,
           .whyNot = TrLater("The library libjxr is not installed."),
           .signatures = kSignatures,

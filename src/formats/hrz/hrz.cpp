@@ -16,7 +16,7 @@ namespace fotomill {
 
 namespace {
 
-constexpr int32_t kWidth = 256, kHeight = 240;
+constexpr int32_t kWidth = kHrzWidth, kHeight = kHrzHeight;
 constexpr size_t kRowSize = 3 * kWidth;
 constexpr uint64_t kFileSize = kRowSize * kHeight;
 
@@ -74,8 +74,6 @@ Status HrzRead(PictureRecord& picture, const ReadRequest& request) {
 Status HrzWrite(PictureRecord& picture, const WriteOptions& options) {
   const ProgressScope progress(picture);
   if (picture.image.Empty()) return Status::MemoryAllocationError;
-  if (picture.image.Width() != kWidth || picture.image.Height() != kHeight)
-    return Status::UnsuitableImage;
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
   BgrRows rows;

@@ -6,12 +6,13 @@
 
 namespace fotomill {
 
+inline constexpr int32_t kHrzWidth = 256, kHrzHeight = 240;  // pixels, of every file
+
 // Slow-scan television frames, always 256 x 240 pixels. Statuses: FileOpenError (1), DamagedFile
 // (2) for a file of another size, FileReadError (3) for a shorter one, MemoryAllocationError (6).
 Status HrzInfo(PictureRecord& picture, const ReadRequest& request);
 Status HrzRead(PictureRecord& picture, const ReadRequest& request);
-// Also UnsuitableImage (13) for pictures of another size, ErrorCreatingFile (10), ErrorWritingFile
-// (11).
+// Also ErrorCreatingFile (10), ErrorWritingFile (11).
 Status HrzWrite(PictureRecord& picture, const WriteOptions& options);
 
 }  // namespace fotomill

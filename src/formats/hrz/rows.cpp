@@ -13,6 +13,7 @@ constexpr FormatEntry kRows[] = {{
     .read = HrzRead,
     .write = HrzWrite,
     .maxBits = 24,
+    .limits = {kHrzWidth, kHrzHeight, true},
     .extension = "HRZ"sv,
     .description = "(HRZ) SSTV"sv,
     .enabled = 1,

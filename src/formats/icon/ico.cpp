@@ -402,8 +402,6 @@ Status IcoRead(PictureRecord& picture, const ReadRequest& request) {
 Status IcoWrite(PictureRecord& picture, const WriteOptions& options) {
   const ProgressScope progress(picture);
   if (picture.image.Empty()) return Status::MemoryAllocationError;
-  if (picture.image.Width() > kMostSide || picture.image.Height() > kMostSide)
-    return Status::UnsuitableImage;
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
   const IcoLayout layout = ChooseLayout(picture, options.encode.iconCompression);

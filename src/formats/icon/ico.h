@@ -12,8 +12,8 @@ namespace fotomill {
 // empty file.
 Status IcoInfo(PictureRecord& picture, const ReadRequest& request);
 Status IcoRead(PictureRecord& picture, const ReadRequest& request);
-// Writes one entry; a cursor when the extension is "cur". Also UnsuitableImage (13) for sides over
-// 256, ErrorCreatingFile (10), ErrorWritingFile (11).
+// Writes one entry; a cursor when the extension is "cur". Also ErrorCreatingFile (10),
+// ErrorWritingFile (11).
 Status IcoWrite(PictureRecord& picture, const WriteOptions& options);
 
 }  // namespace fotomill

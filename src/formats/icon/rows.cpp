@@ -23,6 +23,7 @@ constexpr FormatEntry Row(std::string_view extension, std::string_view descripti
           .read = IcoRead,
           .write = IcoWrite,
           .maxBits = 24,
+          .limits = {256, 256},
           .extension = extension,
           .description = description,
           .enabled = 1,

@@ -376,8 +376,6 @@ Status JpegRead(PictureRecord& picture, const ReadRequest& request) {
 Status JpegWrite(PictureRecord& picture, const WriteOptions& options) {
   const ProgressScope progress(picture);
   if (picture.image.Empty()) return Status::MemoryAllocationError;
-  if (picture.image.Width() > JPEG_MAX_DIMENSION || picture.image.Height() > JPEG_MAX_DIMENSION)
-    return Status::UnsuitableImage;
   const uint64_t pixels =
       static_cast<uint64_t>(picture.image.Width()) * static_cast<uint64_t>(picture.image.Height());
   const uint64_t coefficients =

@@ -11,7 +11,7 @@ namespace fotomill {
 // (arithmetic, lossless, 12 bits). `thumbnailSide` of the request asks for a smaller decode.
 Status JpegInfo(PictureRecord& picture, const ReadRequest& request);
 Status JpegRead(PictureRecord& picture, const ReadRequest& request);
-// Also UnsuitableImage (13) for sides over 65535, ErrorCreatingFile (10), ErrorWritingFile (11).
+// Also ErrorCreatingFile (10), ErrorWritingFile (11).
 Status JpegWrite(PictureRecord& picture, const WriteOptions& options);
 Status JpegDetails(PictureRecord& picture);
 

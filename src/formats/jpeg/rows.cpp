@@ -1,6 +1,7 @@
 #include "formats/rows.h"
 
 #include <jconfig.h>
+#include <jmorecfg.h>
 
 #include "formats/jpeg/jpeg.h"
 #include "texts/texts.h"
@@ -36,6 +37,7 @@ constexpr FormatEntry Row(std::string_view extension, std::string_view descripti
           .read = JpegRead,
           .write = JpegWrite,
           .maxBits = 24,
+          .limits = {JPEG_MAX_DIMENSION, JPEG_MAX_DIMENSION},
           .extension = extension,
           .description = description,
           .enabled = enabled,

@@ -10,8 +10,8 @@ namespace fotomill {
 // (3) when data are cut short, MemoryAllocationError (6).
 Status MspInfo(PictureRecord& picture, const ReadRequest& request);
 Status MspRead(PictureRecord& picture, const ReadRequest& request);
-// Also UnsuitableImage (13) for sizes over 65535, ErrorCreatingFile (10), ErrorWritingFile (11),
-// TooManyColors (12) for pictures deeper than 1 bit.
+// Also TooManyColors (12) for pictures deeper than 1 bit, UnsuitableImage (13) for rows whose codes
+// take more than 65535 bytes, ErrorCreatingFile (10), ErrorWritingFile (11).
 Status MspWrite(PictureRecord& picture, const WriteOptions& options);
 
 }  // namespace fotomill

@@ -16,6 +16,7 @@ constexpr FormatEntry kRows[] = {{
     .read = MspRead,
     .write = MspWrite,
     .maxBits = 1,
+    .limits = {UINT16_MAX, UINT16_MAX},
     .extension = "MSP"sv,
     .description = "(MSP) Microsoft Paint"sv,
     .enabled = 1,

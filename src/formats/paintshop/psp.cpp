@@ -21,6 +21,7 @@
 #include "formats/paintshop/psp_planes.h"
 #include "platform/file_view.h"
 #include "processing/pixel_rows.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -67,7 +68,8 @@ Status DescribePicture(const PspFile& psp, int32_t page, PictureRecord& picture)
   const bool plain =
       std::ranges::all_of(psp.layers, [](const PspLayer& layer) { return layer.blendMode == 0; });
   if (page == 0 && !psp.composite.HasPixels() && (psp.otherLayers > 0 || !plain)) {
-    picture.warning.AssignCut("Layers that are not plain pixels are not shown as they should be.");
+    picture.warning.AssignCut(
+        TrLater("Layers that are not plain pixels are not shown as they should be."));
   }
   if (indexed) {
     picture.palette = psp.hasPalette ? psp.palette : GrayRamp();

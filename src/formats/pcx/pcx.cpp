@@ -203,7 +203,7 @@ struct PcxLayout {
   uint16_t bytesPerLine = 0;  // of one plane
 };
 
-// UnsuitableImage when a size does not fit its field.
+// UnsuitableImage when a line does not fit its field.
 Status ChooseLayout(const PictureRecord& picture, PcxLayout& layout) {
   const PackedImage& image = picture.image;
   const bool planar = image.Bits() == 4 && picture.bitsPerPixel >= 2 && picture.bitsPerPixel <= 4;
@@ -213,10 +213,7 @@ Status ChooseLayout(const PictureRecord& picture, PcxLayout& layout) {
                                        : layout.depth <= 4 ? layout.depth
                                                            : 1);
   const int32_t bytesPerLine = layout.depth <= 4 ? (image.Width() + 7) / 8 : image.Width();
-  if (bytesPerLine > UINT16_MAX || image.Width() - 1 > UINT16_MAX ||
-      image.Height() - 1 > UINT16_MAX) {
-    return Status::UnsuitableImage;
-  }
+  if (bytesPerLine > UINT16_MAX) return Status::UnsuitableImage;
   layout.bytesPerLine = static_cast<uint16_t>(bytesPerLine);
   return Status::Ok;
 }

@@ -18,8 +18,8 @@ Status PcxInfo(PictureRecord& picture, const ReadRequest& request);
 Status PcxRead(PictureRecord& picture, const ReadRequest& request);
 
 // Writes `image` to picture.fileName as a version 5 file; pictures of 2 to 4 bits in as many
-// planes. Ok; MemoryAllocationError when there is no image; UnsuitableImage when a size does not
-// fit the header's fields; ErrorCreatingFile, ErrorWritingFile.
+// planes. Ok; MemoryAllocationError when there is no image; UnsuitableImage for 65536 columns of
+// more than 4 bits; ErrorCreatingFile, ErrorWritingFile.
 Status PcxWrite(PictureRecord& picture, const WriteOptions& options);
 
 }  // namespace fotomill

@@ -15,6 +15,7 @@ constexpr FormatEntry kRows[] = {{
     .read = PcxRead,
     .write = PcxWrite,
     .maxBits = 24,
+    .limits = {UINT16_MAX + 1, UINT16_MAX + 1},
     .extension = "PCX"sv,
     .description = "(PCX) PC Paintbrush"sv,
     .enabled = 1,

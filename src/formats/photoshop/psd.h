@@ -12,7 +12,7 @@ namespace fotomill {
 // picture nor layers.
 Status PsdInfo(PictureRecord& picture, const ReadRequest& request);
 Status PsdRead(PictureRecord& picture, const ReadRequest& request);
-// Also UnsuitableImage (13) for sides over 30000, ErrorCreatingFile (10), ErrorWritingFile (11).
+// Also ErrorCreatingFile (10), ErrorWritingFile (11).
 Status PsdWrite(PictureRecord& picture, const WriteOptions& options);
 Status PsdDetails(PictureRecord& picture);
 

@@ -154,8 +154,6 @@ Status PsdWrite(PictureRecord& picture, const WriteOptions& options) {
   const ProgressScope progress(picture);
   const PackedImage& image = picture.image;
   if (image.Empty()) return Status::MemoryAllocationError;
-  if (image.Width() > kLongestPsdSide || image.Height() > kLongestPsdSide)
-    return Status::UnsuitableImage;
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
   const PsdMode mode = ModeFor(picture);

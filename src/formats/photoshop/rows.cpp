@@ -1,6 +1,7 @@
 #include "formats/rows.h"
 
 #include "formats/photoshop/psd.h"
+#include "formats/photoshop/psd_file.h"
 
 namespace fotomill {
 
@@ -18,6 +19,7 @@ constexpr FormatEntry Row(std::string_view extension, std::string_view descripti
           .read = PsdRead,
           .write = PsdWrite,
           .maxBits = 24,
+          .limits = {kLongestPsdSide, kLongestPsdSide},
           .extension = extension,
           .description = description,
           .enabled = 1,

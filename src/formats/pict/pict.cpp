@@ -14,6 +14,7 @@
 #include "formats/pict/pict_file.h"
 #include "formats/pict/pict_rows.h"
 #include "platform/file_view.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -80,8 +81,8 @@ void DescribePicture(const PictFile& pict, const View& view, PictureRecord& pict
   picture.simplified = pict.drawings > 0;
   picture.warning.Clear();
   if (pict.drawings > 0)
-    picture.warning.AssignCut("Lines, shapes and text of the drawing are not shown.");
-  if (pict.cutShort) picture.warning.AssignCut("The file ends early.");
+    picture.warning.AssignCut(TrLater("Lines, shapes and text of the drawing are not shown."));
+  if (pict.cutShort) picture.warning.AssignCut(TrLater("The file ends early."));
 }
 
 void StoreIndices(std::span<const uint8_t> indices, int32_t bits, int32_t width,

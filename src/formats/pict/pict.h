@@ -11,8 +11,7 @@ namespace fotomill {
 // not decoded, NoImages (20) for a drawing without any pixels.
 Status PictInfo(PictureRecord& picture, const ReadRequest& request);
 Status PictRead(PictureRecord& picture, const ReadRequest& request);
-// Also UnsuitableImage (13) for more than 8191 columns or 32767 rows, ErrorCreatingFile (10),
-// ErrorWritingFile (11).
+// Also ErrorCreatingFile (10), ErrorWritingFile (11).
 Status PictWrite(PictureRecord& picture, const WriteOptions& options);
 Status PictDetails(PictureRecord& picture);
 

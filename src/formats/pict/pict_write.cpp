@@ -11,8 +11,6 @@ namespace fotomill {
 
 namespace {
 
-// a row of 32-bit pixels has at most 32767 bytes
-constexpr int32_t kMostColumns = 8191, kMostRows = 32767;
 constexpr uint32_t kScreenResolution = 72 << 16;
 // their type, bits of a pixel, parts, bits of a part
 constexpr uint16_t kDirectPixels[] = {16, 32, 3, 8};
@@ -99,7 +97,6 @@ Status PictWrite(PictureRecord& picture, const WriteOptions& options) {
   const ProgressScope progress(picture);
   const PackedImage& image = picture.image;
   if (image.Empty()) return Status::MemoryAllocationError;
-  if (image.Width() > kMostColumns || image.Height() > kMostRows) return Status::UnsuitableImage;
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
   WriteHead(out, image);

@@ -16,6 +16,7 @@ constexpr FormatEntry kRows[] = {{
     .read = PictRead,
     .write = PictWrite,
     .maxBits = 24,
+    .limits = {8191, 32767},  // a row of 32-bit pixels has at most 32767 bytes
     .extension = "PCT"sv,
     .description = "(PCT) Macintosh PICT"sv,
     .enabled = 1,

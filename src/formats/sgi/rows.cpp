@@ -17,6 +17,7 @@ constexpr FormatEntry Row(std::string_view extension, std::string_view descripti
           .read = SgiRead,
           .write = SgiWrite,
           .maxBits = 24,
+          .limits = {UINT16_MAX, UINT16_MAX},
           .extension = extension,
           .description = description,
           .enabled = 1,

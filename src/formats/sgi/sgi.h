@@ -11,7 +11,8 @@ namespace fotomill {
 // NoImages (20) for a file that is a color map.
 Status SgiInfo(PictureRecord& picture, const ReadRequest& request);
 Status SgiRead(PictureRecord& picture, const ReadRequest& request);
-// Also UnsuitableImage (13) for sizes over 65535, ErrorCreatingFile (10), ErrorWritingFile (11).
+// Also UnsuitableImage (13) for more than 4 GiB of data, ErrorCreatingFile (10), ErrorWritingFile
+// (11).
 Status SgiWrite(PictureRecord& picture, const WriteOptions& options);
 
 }  // namespace fotomill

@@ -17,6 +17,7 @@ constexpr FormatEntry kRows[] = {{
     .read = TgaRead,
     .write = TgaWrite,
     .maxBits = 24,
+    .limits = {UINT16_MAX, UINT16_MAX},
     .extension = "TGA"sv,
     .description = "(TGA) Targa"sv,
     .enabled = 1,

@@ -11,7 +11,7 @@ namespace fotomill {
 // NoImages (20) for type 0.
 Status TgaInfo(PictureRecord& picture, const ReadRequest& request);
 Status TgaRead(PictureRecord& picture, const ReadRequest& request);
-// Also UnsuitableImage (13) for sizes over 65535, ErrorCreatingFile (10), ErrorWritingFile (11).
+// Also ErrorCreatingFile (10), ErrorWritingFile (11).
 Status TgaWrite(PictureRecord& picture, const WriteOptions& options);
 
 }  // namespace fotomill

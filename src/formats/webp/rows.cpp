@@ -1,6 +1,7 @@
 #include "formats/rows.h"
 
 #include <webp/decode.h>
+#include <webp/encode.h>
 
 #include "formats/webp/webp.h"
 #include "texts/texts.h"
@@ -32,6 +33,7 @@ constexpr FormatEntry kRows[] = {{
     .read = WebpRead,
     .write = WebpWrite,
     .maxBits = 24,
+    .limits = {WEBP_MAX_DIMENSION, WEBP_MAX_DIMENSION},
     .extension = "WEBP"sv,
     .description = "(WEBP) Google WebP"sv,
     .enabled = 1,

@@ -446,8 +446,6 @@ Status WebpAnimate(const ReadRequest& request, AnimationPointer& animation) {
 Status WebpWrite(PictureRecord& picture, const WriteOptions& options) {
   const ProgressScope progress(picture);
   if (picture.image.Empty()) return Status::MemoryAllocationError;
-  if (picture.image.Width() > WEBP_MAX_DIMENSION || picture.image.Height() > WEBP_MAX_DIMENSION)
-    return Status::UnsuitableImage;
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
   const bool lossless = options.lossless || options.encode.webpLossless;

@@ -13,7 +13,7 @@ namespace fotomill {
 Status WebpInfo(PictureRecord& picture, const ReadRequest& request);
 Status WebpRead(PictureRecord& picture, const ReadRequest& request);
 Status WebpAnimate(const ReadRequest& request, AnimationPointer& animation);
-// Also UnsuitableImage (13) for sides over 16383, ErrorCreatingFile (10), ErrorWritingFile (11).
+// Also ErrorCreatingFile (10), ErrorWritingFile (11).
 Status WebpWrite(PictureRecord& picture, const WriteOptions& options);
 
 }  // namespace fotomill

@@ -4,11 +4,12 @@
 
 #include "core/progress.h"
 #include "core/status.h"
-#include "picture/packed_image.h"
-#include "picture/picture_record.h"
 #include "processing/bands.h"
 
 namespace fotomill {
+
+class PackedImage;
+struct PictureRecord;
 
 // Width and height of a picture or an image.
 struct Size {

@@ -28,6 +28,7 @@ SourcePlace PlaceAt(double x, double y);
 // are asked for.
 using PlaceRow = std::function<void(int32_t left, int32_t y, std::span<SourcePlace> places)>;
 
+// How the color between the centers of pixels is found.
 enum class WarpFilter : int32_t {
   Bicubic,   // cubic convolution with a = -1/2 (Keys 1981)
   Bilinear,
@@ -51,6 +52,7 @@ Status WarpPicture(PictureRecord& picture, Size size, const WarpOptions& options
 struct LinearMap {
   double xx, xy, x0, yx, yy, y0;
 };
+// The same as a function of rows.
 PlaceRow LinearPlaces(const LinearMap& map);
 
 // The map of a result of size `to` that is the picture of size `from` transformed about its center,

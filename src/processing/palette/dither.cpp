@@ -3,6 +3,8 @@
 #include <algorithm>
 #include <cstdlib>
 
+#include "processing/color/nearest_color.h"
+
 namespace fotomill {
 
 namespace {

@@ -4,9 +4,10 @@
 
 #include "core/status.h"
 #include "platform/memory.h"
-#include "processing/color/nearest_color.h"
 
 namespace fotomill {
+
+class NearestColor;
 
 // How the colors that a palette lacks are imitated. The first three are the values of the keys
 // FXColorDither (4 and 8 bits) and FXMonoDither (1 bit).
@@ -34,10 +35,11 @@ constexpr int32_t PatternSize(Dither dither) {
 
 // Each pixel takes the color nearest to it.
 void MapRow(const uint8_t* bgr, int32_t width, NearestColor& nearest, uint8_t* indices);
-// `y` chooses the row of the threshold pattern of `size` x `size`; `spread` is the distance of two
+// An ordered dither. `y` chooses the row of the threshold pattern of `size` x `size`; `spread` is the distance of two
 // colors that it is to bridge.
 void OrderRow(const uint8_t* bgr, int32_t width, int32_t y, int32_t size, int32_t spread,
               NearestColor& nearest, uint8_t* indices);
+// The same between black and white.
 void OrderGrayRow(const uint8_t* gray, int32_t width, int32_t y, int32_t size, uint8_t* indices);
 // White from `threshold` on.
 void CutGrayRow(const uint8_t* gray, int32_t width, int32_t threshold, uint8_t* indices);
@@ -48,6 +50,7 @@ class ErrorDiffuser {
   // For rows of `width` pixels; with `serpentine` every other one is taken from the right. A pixel
   // hands on `handedOn` sixteenths of its error. MemoryAllocationError.
   Status Open(int32_t width, bool serpentine, int32_t handedOn);
+  // The next row, `width` pixels.
   void Row(const uint8_t* bgr, NearestColor& nearest, uint8_t* indices);
   void GrayRow(const uint8_t* gray, uint8_t* indices);  // one byte a pixel
 

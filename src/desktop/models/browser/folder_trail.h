@@ -18,6 +18,7 @@ class FolderTrail {
   }
   // Takes steps that it can; the folder there.
   const std::string& Step(int steps) { return folders_[place_ += static_cast<size_t>(steps)]; }
+  // The folder so many steps back (negative) or ahead, where CanStep allows them.
   const std::string& FolderAt(int steps) const {
     return folders_[place_ + static_cast<size_t>(steps)];
   }

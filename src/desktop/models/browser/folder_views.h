@@ -25,6 +25,7 @@ class FolderViews {
  public:
   // `otherwise` with what is kept of a folder.
   FolderView Find(const std::string& folder, const FolderView& otherwise) const;
+  // Remembers how a folder is shown, as the latest one.
   void Keep(const std::string& folder, const FolderView& view);
 
   // Takes up what the file holds; without one, nothing is kept of any folder.
@@ -35,6 +36,7 @@ class FolderViews {
 
   // The text of the file. Lines that are not understood are passed over.
   static FolderViews Parse(std::string_view text);
+  // The text that Parse reads.
   std::string Text() const;
 
  private:

@@ -44,6 +44,7 @@ class Selection {
   void MoveFocus(size_t line, bool shift, bool control);
   void ToggleFocus();  // selects the focused line, or not any more; others stay
   void SelectOnly(size_t line);  // focus and anchor go there
+  // The focus stays.
   void SelectAll();
   void SelectNone();  // the focus stays
   void Invert();  // selects what was not, and nothing else

@@ -5,9 +5,10 @@
 #include <vector>
 
 #include "core/status.h"
-#include "picture/packed_image.h"
+#include "picture/palette.h"
 
 namespace fotomill {
+class PackedImage;
 struct PictureRecord;
 }
 

@@ -23,6 +23,7 @@ enum class SetupPage {
   Formats
 };
 inline constexpr size_t kSetupPageCount = 10;
+// The title of a page in English.
 const char* TitleOf(SetupPage page);
 
 // One setting in a Setup page or an option box: its page, the box around it, the key, its label.

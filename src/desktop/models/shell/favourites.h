@@ -14,9 +14,11 @@ class Favourites {
   void Load();
   // Absolute paths in the user's order.
   const std::vector<std::string>& Folders() const { return folders_; }
+  // Whether the folder is one of them.
   bool Has(const std::string& folder) const;
   // False when the folder cannot be on a line, there are too many, or the file cannot be written.
   [[nodiscard]] bool Add(const std::string& folder);
+  // False when the file cannot be written.
   [[nodiscard]] bool Remove(const std::string& folder);
   // A folder was renamed: it, and those in it, are found under the new name. True when that
   // concerns one of them.

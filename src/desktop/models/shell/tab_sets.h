@@ -15,6 +15,7 @@ std::vector<std::string> TabSetNames();
 std::string TabSetFile(std::string_view name);
 // The name of the set in use.
 std::string CurrentTabSet();
+// Whether there is a set of that name.
 bool HasTabSet(std::string_view name);
 // False when the file is still there.
 [[nodiscard]] bool DeleteTabSet(std::string_view name);

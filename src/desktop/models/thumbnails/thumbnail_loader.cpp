@@ -1,6 +1,7 @@
 #include "desktop/models/thumbnails/thumbnail_loader.h"
 
 #include <algorithm>
+#include <utility>
 
 #include "core/workers/folder_scope.h"
 #include "core/workers/guarded.h"

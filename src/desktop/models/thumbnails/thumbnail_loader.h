@@ -67,7 +67,9 @@ class ThumbnailCache {
   // The thumbnail of a path in whatever state and size there is: something to show until the right
   // one comes.
   ThumbnailPointer FindAny(const std::string& path) const;
+  // Adds or replaces the thumbnail of a path; the least recently used ones may go.
   void Put(const ThumbnailRequest& request, ThumbnailPointer thumbnail);
+  // Forgets all thumbnails.
   void Clear();
   uint64_t Bytes() const { return bytes_; }  // of all thumbnails in it
   size_t Count() const { return entries_.size(); }  // thumbnails in it

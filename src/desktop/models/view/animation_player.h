@@ -17,10 +17,12 @@ class AnimationPlayer {
 
   // Goes on from the frame that is shown; once the last round has ended, from the first one.
   void Play();
+  // Stays at the current frame.
   void Pause();
   bool Playing() const { return playing_; }
   // Pauses and goes that many frames on, or back; beyond the last one comes the first one.
   void Step(int32_t frames);
+  // The size that frames are decoded for, in pixels.
   void Fit(int32_t width, int32_t height) { frames_.Fit(width, height); }
 
   // What is to be shown at this time; null while that is not decoded yet. Asked too early it is the

@@ -4,6 +4,7 @@
 #include <array>
 #include <vector>
 
+#include "picture/packed_image.h"
 #include "processing/color/blend.h"
 #include "processing/pixel_rows.h"
 

@@ -26,6 +26,7 @@ class ViewTransform {
   // Another picture at the same zoom, and at the same place in parts of it.
   void SetPicture(int32_t width, int32_t height);
   void SetWindow(int32_t width, int32_t height);  // device pixels
+  // How the scale follows the window from now on.
   void SetMode(ZoomMode mode);
   // What the key DefaultViewZoom stands for (choice::ViewZoom).
   void SetModeFromKey(int32_t zoom);
@@ -36,6 +37,7 @@ class ViewTransform {
   // To the scale in the middle of the window.
   void ZoomToMiddle(double scale) { ZoomTo(scale, windowWidth_ / 2.0, windowHeight_ / 2.0); }
   void Pan(double dx, double dy);  // device pixels; stops at the picture's edges
+  // Zoom and position, for SetPlace of a later picture.
   ViewPlace Place() const;
   void SetPlace(const ViewPlace& place);
   // To the middle; a zoom of its own gives way to what the key stands for, fitting stays.

@@ -40,6 +40,7 @@ class ProgressWindow : public wxFrame {
   void SetWaiting(size_t batches);
   // The batch has ended and the box stays: closing lines are there, Close is live.
   void StayOpen();
+  // Whether StayOpen was called.
   bool StaysOpen() const { return done_; }
 
  private:

@@ -27,10 +27,12 @@ class FolderReader {
   // Lists a folder. With `namesFirst` the names come at once and sizes and times in a second,
   // complete list, so that even a folder of 100,000 files is shown at once.
   void List(const std::string& folder, bool namesFirst);
+  // Whether a listing is in progress.
   bool Listing() const { return listing_.Started(); }
   // Reads the headers of items; those that told something come in bunches. Ends with the next
   // listing.
   void ReadFacts(const std::string& folder, PlacedItems wanted);
+  // Whether headers are being read.
   bool ReadingFacts() const { return facts_.Started(); }
 
  private:

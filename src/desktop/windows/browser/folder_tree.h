@@ -36,6 +36,7 @@ class FolderTree : public wxTreeCtrl {
   void Follow(const std::string& folder);
   // The folder of an item; empty for none.
   std::string FolderOf(const wxTreeItemId& item) const;
+  // The folder shown at a point of the window; empty for none.
   std::string FolderAt(const wxPoint& point) const;
 
  private:

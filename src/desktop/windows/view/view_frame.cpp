@@ -15,6 +15,8 @@
 #include "desktop/windows/info/info_frame.h"
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/shell.h"
+#include "desktop/windows/view/animation_bar.h"
+#include "desktop/windows/view/view_animation.h"
 #include "desktop/windows/view/view_commands.h"
 #include "desktop/windows/widgets/bitmaps.h"
 #include "desktop/windows/widgets/screen_reader.h"

@@ -9,13 +9,14 @@
 #include <vector>
 
 #include "desktop/models/view/view_picture.h"
-#include "desktop/windows/view/view_animation.h"
 #include "desktop/windows/view/view_canvas.h"
 #include "desktop/windows/view/view_slideshow.h"
 
 namespace fotomill::desktop {
 
+class AnimationBar;
 class Shell;
+class ViewAnimation;
 
 // A view window: one picture at a time, with its neighbours of the list that it was opened from
 // decoded ahead.
