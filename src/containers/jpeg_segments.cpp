@@ -100,26 +100,38 @@ class Assembly {
 
 }  // namespace
 
-JpegWalk::JpegWalk(WalkedBytes file) : file_(file) {
+JpegWalk::JpegWalk(WalkedBytes file, uint64_t mostGarbage)
+    : file_(file), garbage_(mostGarbage), lenient_(mostGarbage > 0) {
   if (!ByteReader(file_.At(0, 2)).Match("\xFF\xD8")) End(Status::DamagedFile);
+}
+
+// Moves to the FF of the next marker. False if there is too much garbage in front of it.
+bool JpegWalk::FindMarker(uint64_t& at, std::span<const uint8_t>& bytes) {
+  for (;; ++at) {
+    bytes = file_.At(at, WalkedBytes::kMost);
+    const uint8_t next = bytes.size() > 1 ? bytes[1] : kEnd;
+    if (bytes.empty() || (bytes[0] == 0xFF && next != 0 && next != 0xFF)) return true;
+    const bool fill = bytes[0] == 0xFF && next == 0xFF;
+    if ((lenient_ || !fill) && garbage_-- == 0) return false;
+  }
 }
 
 bool JpegWalk::Next(JpegPlace& segment) {
   if (ended_) return false;
-  uint64_t last = next_;  // of the fill bytes, which is the marker's own
-  auto bytes = file_.At(last, WalkedBytes::kMost);
-  if (!bytes.empty() && bytes[0] != 0xFF) return End(Status::DamagedFile);
-  while (bytes.size() > 1 && bytes[1] == 0xFF) bytes = file_.At(++last, WalkedBytes::kMost);
+  uint64_t at = next_;
+  std::span<const uint8_t> bytes;
+  if (!FindMarker(at, bytes)) return End(Status::DamagedFile);
   ByteReader head(bytes);
   head.Skip(1);
   const uint8_t marker = head.U8();
   if (!head.Ok()) return End(Status::FileReadError);
-  if (marker == 0 || marker == kEnd) return End(Status::DamagedFile);
+  if (marker == kEnd) return End(Status::DamagedFile);
   if (marker == kScan) return End(Status::Ok);
   const uint16_t length = StandsAlone(marker) ? 0 : head.Be16();
   if (!head.Ok()) return End(Status::FileReadError);
-  if (!StandsAlone(marker) && length < 2) return End(Status::DamagedFile);
-  segment = {marker, next_, last + head.Position(), last + 2 + length, head.Peek(head.Left())};
+  if (!StandsAlone(marker) && length < 2 && !lenient_) return End(Status::DamagedFile);
+  segment = {marker, next_, at + head.Position(), 0, head.Peek(head.Left())};
+  segment.end = std::max(segment.data, at + 2 + length);
   next_ = segment.end;
   return true;
 }
@@ -128,6 +140,11 @@ bool JpegWalk::End(Status outcome) {
   ended_ = true;
   outcome_ = outcome;
   return false;
+}
+
+JpegSegment SegmentAt(std::span<const uint8_t> file, const JpegPlace& place) {
+  const auto from = [&](uint64_t begin) { return file.subspan(begin, place.end - begin); };
+  return {place.marker, from(place.data), from(place.start)};
 }
 
 bool JpegSegment::Starts(std::string_view head) const { return ByteReader(data).Match(head); }
@@ -159,8 +176,7 @@ Status ParseJpegHead(std::span<const uint8_t> file, JpegHead& head) {
   JpegWalk walk(file);
   for (JpegPlace place; walk.Next(place);) {
     if (place.end > file.size()) return Status::FileReadError;
-    const auto from = [&](uint64_t begin) { return file.subspan(begin, place.end - begin); };
-    head.segments.push_back({place.marker, from(place.data), from(place.start)});
+    head.segments.push_back(SegmentAt(file, place));
   }
   head.scan = walk.Position();
   return walk.Outcome();

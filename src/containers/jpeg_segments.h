@@ -31,7 +31,9 @@ struct JpegPlace {
 // Walks the segments of a file up to its first scan.
 class JpegWalk {
  public:
-  explicit JpegWalk(WalkedBytes file);
+  // As strict as the format; with `mostGarbage` as lenient as decoders: skips up to that many bytes
+  // that belong to no segment, fill bytes included, and takes lengths that are too short as 2.
+  explicit JpegWalk(WalkedBytes file, uint64_t mostGarbage = 0);
   // The next segment; false at the end.
   bool Next(JpegPlace& segment);
   // Where the walk stands, and why it ended: Ok at a scan; DamagedFile (2) at what is no segment;
@@ -42,10 +44,13 @@ class JpegWalk {
   bool ReadFailed() const { return file_.Failed(); }
 
  private:
+  bool FindMarker(uint64_t& at, std::span<const uint8_t>& bytes);
   bool End(Status outcome);
 
   WalkedBytes file_;
   uint64_t next_ = 2;
+  uint64_t garbage_ = 0;  // bytes that may still come
+  bool lenient_ = false;
   bool ended_ = false;
   Status outcome_ = Status::Ok;
 };
@@ -57,6 +62,8 @@ struct JpegSegment {
   std::span<const uint8_t> whole;  // with marker and length
   bool Starts(std::string_view head) const;  // the payload begins with `head`
 };
+// The one at a place, which must lie within the file.
+JpegSegment SegmentAt(std::span<const uint8_t> file, const JpegPlace& place);
 // The segments in the order of the file, up to the first scan.
 struct JpegHead {
   std::vector<JpegSegment> segments;

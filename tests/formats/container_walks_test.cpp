@@ -14,9 +14,10 @@ namespace fotomill::test {
 namespace {
 
 // Each part as its name, where its data are and how many; at last the status, where a walk has one.
-std::string JpegParts(WalkedBytes file) {
+template <uint64_t mostGarbage>
+std::string JpegPartsOver(WalkedBytes file) {
   std::ostringstream list;
-  JpegWalk walk(file);
+  JpegWalk walk(file, mostGarbage);
   for (JpegPlace part; walk.Next(part);) {
     list << std::hex << int{part.marker} << std::dec << '@' << part.data << '+'
          << part.end - part.data << ' ';
@@ -46,6 +47,7 @@ std::string RiffParts(WalkedBytes file) {
   return list.str();
 }
 
+constexpr auto JpegParts = JpegPartsOver<0>;
 constexpr char kPng[] = "89504E470D0A1A0A ";
 
 const struct {
@@ -69,6 +71,14 @@ const struct {
     {"JPEG: cut within fill bytes", JpegParts, Hex("FFD8  FFFFFF"), "= 3"},
     {"JPEG: cut within a length", JpegParts, Hex("FFD8  FFE0 00"), "= 3"},
     {"JPEG: another kind of file", JpegParts, Hex("FFD9  FFDA"), "= 2"},
+    {"JPEG: as much garbage as allowed", JpegPartsOver<5>,
+     Hex("FFD8  00FF00AA FFFE 0003 AA  FFFFDA"), "fe@10+1 = 0 at 11"},
+    {"JPEG: a fill byte too many", JpegPartsOver<4>, Hex("FFD8  00FF00AA FFFE 0003 AA  FFFFDA"),
+     "fe@10+1 = 2"},
+    {"JPEG: more garbage than allowed", JpegPartsOver<3>, Hex("FFD8  00FF00AA FFFE 0003 AA  FFDA"),
+     "= 2"},
+    {"JPEG: a length that is too short, allowed", JpegPartsOver<3>, Hex("FFD8  FFFE 0001  FFDA"),
+     "fe@6+0 = 0 at 6"},
     {"PNG: chunks to IEND", PngParts,
      Hex(kPng + std::string("00000001 49444154 AA 00000000  00000000 49454E44 00000000  00000000 "
                             "65584966 00000000")),

@@ -3,7 +3,6 @@
 #include <cstring>
 #include <string_view>
 
-#include "core/byte_reader.h"
 #include "core/limits.h"
 
 namespace fotomill {
@@ -62,26 +61,14 @@ bool IsKept(const JpegSegment& segment) {
 // number, and refuses what holds too little of a picture for its length, such as a hole of a
 // terabyte behind the first bytes.
 Status WalkHead(JpegReader& reader, std::span<const uint8_t> file) {
-  ByteReader bytes(file);
-  bytes.Skip(2);
-  uint64_t garbage = 0;
-  while (bytes.Ok()) {
-    uint8_t byte = bytes.U8();
-    for (; byte != 0xFF && bytes.Ok(); byte = bytes.U8()) {
-      if (++garbage > limits.garbageBytes) return Status::DamagedFile;
-    }
-    for (; byte == 0xFF && bytes.Ok(); byte = bytes.U8()) {
-      if (++garbage > limits.garbageBytes) return Status::DamagedFile;
-    }
-    JpegSegment segment{.marker = byte, .data = {}, .whole = {}};
-    if (byte == 0xDA || byte == 0xD9) return Status::Ok;
-    if (byte == 0 || byte == 0x01 || (byte >= 0xD0 && byte <= 0xD8)) continue;
-    const uint16_t length = bytes.Be16();
-    segment.data = bytes.Take(length < 2 ? 0u : length - 2u);
-    if (bytes.Ok() && IsKept(segment) && reader.segments.size() < limits.jpegSegments)
+  JpegWalk walk(file, limits.garbageBytes);
+  for (JpegPlace place; walk.Next(place) && place.end <= file.size();) {
+    const JpegSegment segment = SegmentAt(file, place);
+    if (IsKept(segment) && reader.segments.size() < limits.jpegSegments)
       reader.segments.push_back(segment);
   }
-  return Status::Ok;  // the library tells what is missing
+  // The library reports what is missing.
+  return walk.Outcome() == Status::DamagedFile ? Status::DamagedFile : Status::Ok;
 }
 
 }  // namespace
