@@ -76,7 +76,7 @@ constexpr Place kPlaces[] = {
     {"WAV", "(WAV) Windows WAV", 1, 24, FMT_BITMAP | FMT_SOUND | FMT_MEDIA},
     {"WBMP"},
     {"WEBP"},
-    {"WPG", "(WPG) WordPerfect Graphics", 1, 8, FMT_BITMAP},
+    {"WPG"},
     {"XBM"},
     {"Clpbrd", "Windows Clipboard", 1, 24, FMT_BITMAP | FMT_RENDERED | FMT_CLIPBOARD},
     {"Wllppr", "(BMP) Windows wallpaper", 1, 24, FMT_BITMAP | FMT_WALLPAPER | FMT_NO_OPEN},

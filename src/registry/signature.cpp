@@ -66,7 +66,6 @@ constexpr SignatureOfRow kWithoutCodec[] = {
     {"FPX",  {0, "\xd0\xcf\x11\xe0\xa1\xb1\x1a\xe1"sv, TrLater("a compound file")}},
     {"RAS",  {0, "\x59\xa6\x6a\x95"sv, TrLater("Sun raster")}},
     {"DCX",  {0, "\xb1\x68\xde\x3a"sv, "DCX"}},
-    {"WPG",  {0, "\xffWPC"sv, TrLater("WordPerfect graphics")}},
     {"WMF",  {0, "\xd7\xcd\xc6\x9a"sv, "WMF"}},
     {"FLI",  {4, "\x11\xaf"sv, "FLIC"}},
     {"FLC",  {4, "\x11\xaf"sv}},
