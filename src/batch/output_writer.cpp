@@ -5,6 +5,7 @@
 #include "core/text.h"
 #include "metadata/exif/picture_exif.h"
 #include "platform/files.h"
+#include "platform/output_file.h"
 #include "platform/paths.h"
 #include "platform/reason.h"
 #include "platform/temporary_file.h"
@@ -73,12 +74,26 @@ Status OutputWriter::Write(PictureRecord& picture, const Destination& destinatio
   return status;
 }
 
-Status OutputWriter::WriteFile(PictureRecord& picture, const Destination& destination,
-                               const OutputTarget& target, std::string& hint) const {
+bool OutputWriter::MakesFolder(const Destination& destination, const OutputTarget& target) const {
   const bool beside =
       (job_.naming.beside || job_.destinationFolder.empty()) && target.output->folder.empty();
-  const bool there = beside || !function_.out.empty() || destination.elsewhere;
-  if (!there && !platform::MakeFolders(platform::FolderOf(destination.path)))
+  return !beside && function_.out.empty() && !destination.elsewhere;
+}
+
+Status OutputWriter::PlanFile(const PictureRecord& picture, const Destination& destination,
+                              const OutputTarget& target, std::string& hint) const {
+  const std::string folder = platform::FolderOf(destination.path);
+  const bool there =
+      MakesFolder(destination, target) || folder.empty() || platform::IsFolder(folder);
+  if (there && platform::MayCreate(destination.path)) return Status::Ok;
+  hint = Hint(destination, Status::ErrorCreatingFile, picture, target);
+  return Status::ErrorCreatingFile;
+}
+
+Status OutputWriter::WriteFile(PictureRecord& picture, const Destination& destination,
+                               const OutputTarget& target, std::string& hint) const {
+  if (MakesFolder(destination, target) &&
+      !platform::MakeFolders(platform::FolderOf(destination.path)))
     return Status::ErrorCreatingFile;
   WriteOptions write{.encode = job_.encode};
   write.existing = destination.replace ? platform::Existing::Replace : platform::Existing::Refuse;

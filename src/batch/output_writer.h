@@ -24,10 +24,15 @@ class OutputWriter {
   // then, where that is allowed. Statuses as WritePicture, with a hint.
   Status Write(PictureRecord& picture, const Destination& destination, const OutputTarget& target,
                std::string& hint) const;
+  // What Write would return, as far as the place of the output decides.
+  Status PlanFile(const PictureRecord& picture, const Destination& destination,
+                  const OutputTarget& target, std::string& hint) const;
   // Names what the format could not store, for a written output; empty for nothing.
   RecordedText Note(const PictureRecord& picture, const Destination& destination) const;
 
  private:
+  // Whether the folder of an output is made if it is missing.
+  bool MakesFolder(const Destination& destination, const OutputTarget& target) const;
   bool Reduces(const OutputTarget& target) const { return function_.reduce || target.kept; }
   Status WriteFile(PictureRecord& picture, const Destination& destination,
                    const OutputTarget& target, std::string& hint) const;

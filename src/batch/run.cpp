@@ -279,7 +279,8 @@ class Batch {
     }
     std::string hint;
     const Status status =
-        function_.dryRun ? Status::Ok : writer_.Write(picture, destination, target, hint);
+        function_.dryRun ? writer_.PlanFile(picture, destination, target, hint)
+                         : writer_.Write(picture, destination, target, hint);
     if (status == Status::Ok) {
       outcome = Written(file, destination, replaces, picture);
       return true;

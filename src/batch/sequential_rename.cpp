@@ -114,6 +114,7 @@ platform::CommitResult RenamedFiles::Rename(const std::string& from, const std::
     if (log_ != nullptr) log_->Settle(result == platform::CommitResult::Done);
     return result;
   }
+  if (!platform::MayCreate(to)) return platform::CommitResult::Failed;
   there_.erase(from);
   gone_.insert(from);
   gone_.erase(to);

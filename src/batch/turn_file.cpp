@@ -10,6 +10,7 @@
 #include "platform/file_view.h"
 #include "platform/files.h"
 #include "platform/held_file.h"
+#include "platform/output_file.h"
 #include "platform/paths.h"
 #include "platform/temporary_file.h"
 #include "registry/registry.h"
@@ -82,7 +83,7 @@ class Turning {
   }
 
   Status Turn() {
-    if (source_ == destination_ && !held_.Hold(source_))
+    if (source_ == destination_ && !request_.dryRun && !held_.Hold(source_))
       return Fail(Status::ErrorCreatingFile, ReasonSentence());
     stamp_ = source_ == destination_ ? held_.Stamp() : platform::StampOf(source_);
     PicturePointer picture;
@@ -92,7 +93,8 @@ class Turning {
     }
     const auto time = request_.keepTime ? platform::ModificationTime(source_) : std::nullopt;
     RETURN_IF_BAD(FormatRow(picture->formatIndex).turnsWithoutLoss ? TurnAsJpeg() : TurnDecoded(std::move(picture)));
-    if (!result_.changed || !time || platform::SetModificationTime(destination_, *time))
+    if (!result_.changed || !time || request_.dryRun ||
+        platform::SetModificationTime(destination_, *time))
       return Status::Ok;
     return Fail(Status::ErrorWritingFile,
                 Tr("The file was turned, but its time could not be set."));
@@ -180,15 +182,16 @@ class Turning {
   // An unchanged picture is copied, unless source and destination are the same.
   Status WriteUnlessThere(std::span<const uint8_t> bytes, bool same) {
     if (same && source_ == destination_) return Status::Ok;
+    if (request_.dryRun) {
+      result_.changed = platform::MayCreate(destination_);
+      return result_.changed ? Status::Ok : Fail(Status::ErrorCreatingFile, CannotCreate());
+    }
     ByteWriter out;
     const bool replaces =
         source_ != destination_ && options_.existing == platform::Existing::Replace;
     if (replaces && !held_.Hold(destination_))
       return Fail(Status::ErrorCreatingFile, ReasonSentence());
-    if (!out.Create(destination_)) {
-      return Fail(Status::ErrorCreatingFile,
-                  WithReason(Tr("\"%1\" cannot be created.", destination_)));
-    }
+    if (!out.Create(destination_)) return Fail(Status::ErrorCreatingFile, CannotCreate());
     out.Bytes(bytes);
     WriteOptions options = options_;
     bool unchanged = true;  // a file that another program changed meanwhile is not replaced
@@ -202,6 +205,10 @@ class Turning {
     if (status != Status::Ok) return Fail(status, ReasonSentence());
     result_.changed = true;
     return Status::Ok;
+  }
+
+  std::string CannotCreate() const {
+    return WithReason(Tr("\"%1\" cannot be created.", destination_));
   }
 
   const std::string &source_, &destination_;

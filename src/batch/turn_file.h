@@ -17,6 +17,7 @@ struct TurnRequest {
   // JPEG edges that cannot be turned losslessly are cropped
   bool trim = false;
   bool keepTime = false;                    // the new file has the time of the old one
+  bool dryRun = false;                      // nothing is written; the result is that of a run
 };
 
 // The result for one file.

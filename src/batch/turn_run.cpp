@@ -8,6 +8,7 @@
 #include "batch/reported_run.h"
 #include "batch/run_names.h"
 #include "platform/files.h"
+#include "platform/output_file.h"
 #include "platform/paths.h"
 #include "texts/system_reason.h"
 #include "texts/texts.h"
@@ -26,13 +27,14 @@ class TurnBatch {
       : files_(files),
         function_(function),
         job_(job),
-        run_(
-            files, job,
-            {.process =
-                 [this](size_t i) {
-                   const auto outcome = Process(i);
-                   return outcome ? std::vector{*outcome} : std::vector<FileOutcome>();
-                 }, .history = FileFunction::Transform, .dryRun = function.dryRun}) {
+        run_(files, job,
+             {.process =
+                  [this](size_t i) {
+                    const auto outcome = Process(i);
+                    return outcome ? std::vector{*outcome} : std::vector<FileOutcome>();
+                  },
+              .history = FileFunction::Transform,
+              .dryRun = function.request.dryRun}) {
     for (const BatchFile& file : files_) {
       if (file.status == Status::Ok) {
         names_.AddSource(file.name);
@@ -68,7 +70,7 @@ class TurnBatch {
       return std::nullopt;
     }
     if (!goesOn && outcome.status != Status::Ok && job_.stop.Token().Asked()) return std::nullopt;
-    if (goesOn && !function_.dryRun) Turn(outcome);
+    if (goesOn) Turn(outcome);
     return outcome;
   }
 
@@ -124,7 +126,10 @@ class TurnBatch {
       options.makeWay = [&] { return kept = function_.keepPrevious(outcome.source); };
     }
     TurnedFile turned;
-    if (!folder.empty() && !platform::MakeFolders(folder)) {
+    const bool ready = function_.request.dryRun
+                           ? platform::IsFolder(folder) || platform::MayCreate(outcome.destination)
+                           : platform::MakeFolders(folder);
+    if (!folder.empty() && !ready) {
       turned = {.status = Status::ErrorCreatingFile,
                 .hint = WithReason(Tr("The folder \"%1\" does not exist.", folder))};
     } else {

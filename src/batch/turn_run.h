@@ -18,7 +18,6 @@ struct TurnFunction {
   bool inPlace = false;
   bool keepTree = false;  // the folders of the selection are recreated there
   uint32_t jobs = 0;      // number of parallel jobs; 0: one per core
-  bool dryRun = false;    // nothing is written
   // Called on any thread before a file is replaced in place; false: it is left alone, because no
   // copy could be kept.
   std::function<bool(const std::string& path)> keepPrevious = {};

@@ -57,4 +57,8 @@ class OutputFile {
   bool failed_ = false;
 };
 
+// Whether a file of that name could be made now, with those folders of its path that are missing.
+// False keeps the system's reason. For runs that only tell what they would do.
+bool MayCreate(const std::string& path);
+
 }  // namespace fotomill::platform

@@ -90,14 +90,7 @@ def terminal(folder):
     one.write_bytes(bitmap(4, 4))
     out = folder / "made" / "one.pcx"
     run = Terminal("convert", one, "--to", "pcx", "--dest", out.parent)
-    run.until("Create it?")
-    run.type("n\n")
-    expect("a folder that is not wanted", run.end() == 1 and not out.parent.exists(), run.seen)
-
-    run = Terminal("convert", one, "--to", "pcx", "--dest", out.parent)
-    run.until("Create it?")
-    run.type("y\n")
-    expect("a folder that is wanted", run.end() == 0 and out.exists(), run.seen)
+    expect("a folder is made without a question", run.end() == 0 and out.exists(), run.seen)
 
     for answer, status, name in (("n other\n", 0, "other.pcx"), ("\x03", 130, None)):
         run = Terminal("convert", one, "--to", "pcx", "--dest", out.parent)

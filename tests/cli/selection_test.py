@@ -1,29 +1,9 @@
 #!/usr/bin/env python3
 """Which files of folders and lists a command takes, and in which order. $FOTOMILL names the program."""
-import os
-import shutil
 import struct
-import subprocess
 import sys
-import tempfile
-import threading
-from pathlib import Path
 
-PROGRAM = os.environ.get("FOTOMILL") or sys.exit("FOTOMILL is not set")
-failures = 0
-
-
-def check(found, expected, what):
-    global failures
-    if found != expected:
-        failures += 1
-        print(f"FAILED: {what}: expected {expected!r}, found {found!r}")
-
-
-def bitmap(width=3, height=2):
-    row = (width * 3 + 3) // 4 * 4
-    return struct.pack("<2sIHHIIiiHHIIiiII", b"BM", 54 + row * height, 0, 0, 54, 40, width, height, 1, 24, 0, row * height,
-                       0, 0, 0, 0) + bytes(row * height)
+from place import Place, bitmap, check, finish
 
 
 def dated_jpeg(date):
@@ -34,32 +14,10 @@ def dated_jpeg(date):
     return b"\xFF\xD8\xFF\xE1" + struct.pack(">H", len(block) + 2) + block + b"\xFF\xD9"
 
 
-class Place:
-    def __enter__(self):
-        self.path = Path(tempfile.mkdtemp(prefix="selection-"))
-        return self
-
-    def __exit__(self, *_):
-        shutil.rmtree(self.path)
-
-    def files(self, *names, contents=None, time=None):
-        for name in names:
-            path = self.path / name
-            path.parent.mkdir(parents=True, exist_ok=True)
-            path.write_bytes(bitmap() if contents is None else contents)
-            if time is not None:
-                os.utime(path, ns=(time, time))
-
-    def run(self, *arguments, stdin=subprocess.DEVNULL, given=None, pass_fds=()):
-        options = {"input": given} if given is not None else {"stdin": stdin}
-        run = subprocess.run([PROGRAM, *arguments], cwd=self.path, capture_output=True, timeout=60, pass_fds=pass_fds,
-                             env={**os.environ, "FOTOMILL_DATA": str(self.path / "data")}, check=False, **options)
-        return run.returncode, run.stdout.decode(), run.stderr.decode()
-
-    def taken(self, *arguments, **more):
-        """The files that a command takes, in order."""
-        _, out, _ = self.run("convert", "--dry-run", "-t", "pcx", "-d", "out", *arguments, **more)
-        return [line.split(" -> ")[0] for line in out.splitlines()]
+def taken(place, *arguments, **more):
+    """The files that a command takes, in order."""
+    _, out, _ = place.run("convert", "--dry-run", "-t", "pcx", "-d", "out", *arguments, **more)
+    return [line.split(" -> ")[0] for line in out.splitlines()]
 
 
 def left_out():
@@ -79,7 +37,7 @@ def left_out():
             (["f/.h.bmp"], ["f/.h.bmp"], ""),
         ]
         for arguments, expected, line in rows:
-            check(place.taken(*arguments), expected, arguments)
+            check(taken(place, *arguments), expected, arguments)
             err = place.run("info", *arguments)[2].splitlines()
             if line is not None:
                 check([text for text in err if "left out" in text], [line] if line else [], f"{arguments}, its line")
@@ -94,7 +52,7 @@ def left_out():
 
 def order():
     with Place() as place:
-        place.files("f/img10.bmp", contents=bitmap(3, 2), time=3_000_000_001)
+        place.files("f/img10.bmp", contents=bitmap(), time=3_000_000_001)
         place.files("f/img2.bmp", contents=bitmap(30, 2), time=3_000_000_002)
         place.files("f/IMG1.bmp", contents=bitmap(20, 2), time=5_000_000_000)
         names = ["f/IMG1.bmp", "f/img2.bmp", "f/img10.bmp"]
@@ -109,11 +67,11 @@ def order():
             (["f", "--sort", "size", "--reverse"], ["f/img2.bmp", "f/IMG1.bmp", "f/img10.bmp"]),
         ]
         for arguments, expected in rows:
-            check(place.taken(*arguments), expected, arguments)
+            check(taken(place, *arguments), expected, arguments)
         check(place.run("info", "f", "--sort", "date")[0], 2, "an unknown order")
         place.files("x/2.bmp", "y/1.bmp")
-        check(place.taken("y", "x", "--sort", "name"), ["x/2.bmp", "y/1.bmp"], "two folders sorted together")
-        check(place.taken("y", "x"), ["y/1.bmp", "x/2.bmp"], "two folders as named")
+        check(taken(place, "y", "x", "--sort", "name"), ["x/2.bmp", "y/1.bmp"], "two folders sorted together")
+        check(taken(place, "y", "x"), ["y/1.bmp", "x/2.bmp"], "two folders as named")
         status, out, _ = place.run("rename", "f", "--dry-run", "--sort", "time")
         check((status, out.splitlines()[0]), (0, "f/img10.bmp -> f/PICTURE0001.bmp"), "rename by time")
 
@@ -132,7 +90,7 @@ def order_by_date():
 def main():
     for case in (left_out, order, order_by_date):
         case()
-    return 1 if failures else 0
+    return finish()
 
 
 if __name__ == "__main__":

@@ -121,7 +121,7 @@ int RunSheet(const SheetOptions& options, const CommandContext& context) {
     output.Message(output.ShownMessage(options.dest) + ": " + StatusText(status) + hint);
     return kExitFailed;
   }
-  return FinishBatch(job);
+  return FinishBatch(job, context);
 }
 
 }  // namespace

@@ -206,7 +206,7 @@ int RunConvert(const ConvertOptions& options, const CommandContext& context) {
     output.Message(output.ShownMessage(options.dest) + ": " + StatusText(status));
     return kExitFailed;
   }
-  return FinishBatch(job);
+  return FinishBatch(job, context);
 }
 
 }  // namespace

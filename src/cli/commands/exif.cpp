@@ -8,7 +8,6 @@
 
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
-#include "cli/frame/used_files.h"
 #include "cli/selection/file_selection.h"
 #include "metadata/exif/exif_source.h"
 #include "metadata/exif/exif_text.h"
@@ -117,7 +116,6 @@ class ExifRun {
         continue;
       }
       output_.CountFile();
-      used_.Add(file.name);
       if (!outcome.hasExif && !options_.json) {
         output_.Note(output_.ShownMessage(file.name) + ": " + Tr("This file has no EXIF."));
       }
@@ -170,7 +168,6 @@ class ExifRun {
 
   const ExifOptions& options_;
   ResultOutput output_;
-  UsedFiles used_{FileFunction::GetInfo};
   ExifText lines_{ExifTextOptionsFromSettings()};
   std::string text_;
 };

@@ -6,7 +6,6 @@
 #include "batch/picture_failure.h"
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
-#include "cli/frame/used_files.h"
 #include "cli/selection/file_selection.h"
 #include "core/shown_text.h"
 #include "core/text.h"
@@ -108,7 +107,7 @@ Status GatherFacts(const SelectedFile& file, PicturePointer& picture) {
   return Status::Ok;
 }
 
-void ReportFile(const SelectedFile& file, ResultOutput& output, UsedFiles& used) {
+void ReportFile(const SelectedFile& file, ResultOutput& output) {
   PicturePointer picture;
   const Status status = GatherFacts(file, picture);
   const std::string hint =
@@ -129,7 +128,6 @@ void ReportFile(const SelectedFile& file, ResultOutput& output, UsedFiles& used)
     return;
   }
   output.CountFile();
-  used.Add(file.name);
   if (!output.IsJson()) output.Line(output.Shown(file.name) + "\n" + FactsAsText(*picture));
 }
 
@@ -138,10 +136,9 @@ int RunInfo(const InfoOptions& options, const CommandContext& context) {
   if (!selection) return kExitUsage;
   ResultOutput output(context, options.json);
   output.CloseWith(selection->leftOut);
-  UsedFiles used(FileFunction::GetInfo);
   for (const SelectedFile& file : selection->files) {
     if (!output.GoesOn()) break;
-    ReportFile(file, output, used);
+    ReportFile(file, output);
   }
   return output.Finish();
 }

@@ -11,7 +11,10 @@
 #include "cli/frame/result_output.h"
 #include "cli/frame/terminal_box.h"
 #include "cli/selection/file_selection.h"
+#include "core/plain_name.h"
 #include "platform/folders.h"
+#include "settings/configuration.h"
+#include "settings/key_table.h"
 #include "texts/system_reason.h"
 #include "texts/texts.h"
 
@@ -21,7 +24,10 @@ namespace {
 
 struct RenameCommandOptions {
   SelectionOptions selection;
-  int32_t digits = 0;  // 0: the default
+  std::string base;       // empty: as configured
+  int32_t start = -1;     // -1: the default
+  int32_t digits = 0;     // 0: the default
+  int32_t increment = 0;  // 0: as configured
   int32_t seed = -1;   // -1: a new one each time
   bool undo = false;
   bool dryRun = false;
@@ -39,7 +45,27 @@ int RunUndo(const RenameCommandOptions& options, const std::vector<SelectedFile>
   return kExitFailed;
 }
 
+// The rules of the settings with the options on top. A series that the command line names counts
+// for itself: it begins at its own number and leaves the configured one alone.
+SequentialRenameRules RulesOf(const RenameCommandOptions& options) {
+  SequentialRenameRules rules = SequentialRenameRulesFromSettings();
+  if (!options.base.empty()) {
+    rules.baseName = options.base;
+    rules.numberFirst = false;  // that has no base name
+  }
+  if (!options.base.empty() || options.start >= 0) {
+    rules.update = false;
+    if (!IsForThisRun(KeyOf(KeyNumber::SequentialRenameBaseNumber))) rules.number = 1;
+    if (options.start >= 0) rules.number = static_cast<uint32_t>(options.start);
+  }
+  if (options.digits > 0) rules.digits = options.digits;
+  if (options.increment > 0) rules.increment = static_cast<uint32_t>(options.increment);
+  return rules;
+}
+
 int RunRenameCommand(const RenameCommandOptions& options, const CommandContext& context) {
+  if (!IsPlainName(options.base))
+    return UsageError(context, Tr("The base name must be part of a file name, not a path."));
   const SelectionOptions& selection = options.selection;
   Selection chosen;
   if (!options.undo || !context.names.values.empty() || !selection.filesFrom.empty()) {
@@ -56,12 +82,11 @@ int RunRenameCommand(const RenameCommandOptions& options, const CommandContext& 
   if (options.undo) {
     status = RunUndo(options, chosen.files, output, job);
   } else {
-    RenameOptions rename{.rules = SequentialRenameRulesFromSettings(), .dryRun = options.dryRun};
-    if (options.digits > 0) rename.rules.digits = options.digits;
+    RenameOptions rename{.rules = RulesOf(options), .dryRun = options.dryRun};
     if (options.seed >= 0) rename.seed = static_cast<uint64_t>(options.seed);
     RunRename(chosen.files, rename, job);
   }
-  return std::max(status, FinishBatch(job));
+  return std::max(status, FinishBatch(job, context));
 }
 
 }  // namespace
@@ -69,18 +94,33 @@ int RunRenameCommand(const RenameCommandOptions& options, const CommandContext& 
 void SetUpRename(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<RenameCommandOptions>();
   AddSelection(app, options->selection, context);
-  AddFlag(app, "--undo", options->undo,
-          "Undo the last renaming, of all files or of the named ones");
-  AddNumber(app, "--digits", options->digits, "N", 1, 10, "Digits of the numbers (default: 4)");
-  AddNumber(app, "--seed", options->seed, "N", 0, INT32_MAX,
-            "Seed of SequentialRenameRandom: the same seed, the same order");
+  CLI::Option* undo = AddFlag(app, "--undo", options->undo,
+                              "Undo the last renaming, of all files or of the named ones");
+  Exclude(AddName(app, "--base", options->base, "NAME",
+                  "Base name (default: SequentialRenameBaseName); counts from --start"),
+          undo);
+  Exclude(AddNumber(app, "--start", options->start, "N", 0, INT32_MAX,
+                    "First number (default with --base: 1); the configured one is not changed"),
+          undo);
+  Exclude(AddNumber(app, "--increment", options->increment, "N", 1, INT32_MAX,
+                    "Step between numbers (default: SequentialRenameIncrement)"),
+          undo);
+  Exclude(
+      AddNumber(app, "--digits", options->digits, "N", 1, 10, "Digits of the numbers (default: 4)"),
+      undo);
+  Exclude(AddNumber(app, "--seed", options->seed, "N", 0, INT32_MAX,
+                    "Seed of SequentialRenameRandom: the same seed, the same order"),
+          undo);
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be done");
   AddFlag(app, "--json", options->json,
           "Print a JSON array of {file, destination, status, message}");
   SetFooter(app,
-            "The names follow the configuration keys that begin with SequentialRename: BaseName, BaseNumber, Increment,\n"
-            "MaxAttempts, Sep, Hyphen, Prefix, Random, SkipCollide and Update.",
-            "fotomill --set SequentialRenameBaseName=holiday- rename photos --dry-run");
+            "The names follow the configuration keys that begin with SequentialRename: BaseName, "
+            "BaseNumber, Increment,\n"
+            "MaxAttempts, Sep, Hyphen, Prefix, Random, SkipCollide and Update. Without --base and "
+            "--start, each run counts on from\n"
+            "the last one unless SequentialRenameUpdate is off.",
+            "fotomill rename photos --base holiday- --sort taken --dry-run");
   context.run = [options, &context] { return RunRenameCommand(*options, context); };
 }
 

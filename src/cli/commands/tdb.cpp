@@ -82,8 +82,8 @@ Adding MakeRecord(const SelectedFile& file, const ThumbnailOptions& options) {
 // Appends records in blocks, since each append waits for the disk.
 class Appending {
  public:
-  Appending(ThumbnailDatabase& database, ResultOutput& output)
-      : database_(database), output_(output) {}
+  Appending(ThumbnailDatabase& database, ResultOutput& output, bool history)
+      : database_(database), output_(output), used_(FileFunction::Catalog, history) {}
 
   void Add(const SelectedFile& file, Adding& adding) {
     if (adding.status != Status::Ok) {
@@ -114,15 +114,15 @@ class Appending {
  private:
   ThumbnailDatabase& database_;
   ResultOutput& output_;
-  UsedFiles used_{FileFunction::Catalog};
+  UsedFiles used_;
   std::vector<std::string> names_;
   std::vector<DatabaseRecord> records_;
 };
 
 int AddFiles(const std::vector<SelectedFile>& files, uint32_t jobs, ThumbnailDatabase& database,
-             ResultOutput& output) {
+             ResultOutput& output, bool history) {
   const ThumbnailOptions options = ThumbnailOptionsFromSettings();
-  Appending appending(database, output);
+  Appending appending(database, output, history);
   std::vector<Adding> addings(files.size());
   std::atomic<bool> goesOn = true;
   OrderedRun run({
@@ -170,7 +170,7 @@ int RunAdd(const TdbOptions& options, CommandContext& context) {
   if (!OpenDatabase(database, path, true, output)) return output.Finish();
   const uint32_t jobs =
       options.jobs == 0 ? platform::CoreCount() : static_cast<uint32_t>(options.jobs);
-  return AddFiles(selection->files, jobs, database, output);
+  return AddFiles(selection->files, jobs, database, output, !context.global.noHistory);
 }
 
 int RunFind(const TdbOptions& options, CommandContext& context) {

@@ -20,6 +20,7 @@
 #include "metadata/exif/picture_exif.h"
 #include "platform/existence.h"
 #include "platform/files.h"
+#include "platform/output_file.h"
 #include "platform/paths.h"
 #include "platform/process.h"
 #include "platform/volumes.h"
@@ -68,12 +69,14 @@ const char* NameOf(ThumbnailState state) {
   return "broken";
 }
 
-Status MakeThumbnail(const std::string& name, const ThumbnailOptions& options) {
+// A dry run does all but write; a thumbnail file that is write-protected would be replaced.
+Status MakeThumbnail(const std::string& name, const ThumbnailOptions& options, bool dryRun) {
   ThumbnailRecord record;
   RETURN_IF_BAD(MakeThumbnailOfFile(name, options, record));
-  return WriteThumbnailFile(record, ThumbnailPathFor(name), options.hidden)
-             ? Status::Ok
-             : Status::ErrorCreatingFile;
+  const std::string path = ThumbnailPathFor(name);
+  const bool made = dryRun ? platform::MayCreate(platform::IsRegularFile(path) ? path + "~" : path)
+                           : WriteThumbnailFile(record, path, options.hidden);
+  return made ? Status::Ok : Status::ErrorCreatingFile;
 }
 
 // A selected file and its result.
@@ -132,17 +135,17 @@ int RunMake(const ThumbsOptions& options, const CommandContext& context) {
   const ThumbnailOptions thumbnails = ThumbnailOptionsFromSettings();
   ResultOutput output(context, options.json);
   output.CloseWith(selection->leftOut);
-  UsedFiles used(options.dryRun ? std::nullopt : std::optional(FileFunction::Catalog));
+  UsedFiles used(FileFunction::Catalog, !options.dryRun && !context.global.noHistory);
   std::atomic<bool> goesOn = true;
   OrderedRun run({
       .work =
           [&](size_t item) {
-            if (options.dryRun) return Status::Ok;
             const FolderScope folder(files[item].name);
             for (const size_t i : makings[item].together) {
               Making& making = makings[i];
               const std::string& name = files[i].name;
-              making.status = Guarded([&] { return MakeThumbnail(name, thumbnails); });
+              making.status =
+                  Guarded([&] { return MakeThumbnail(name, thumbnails, options.dryRun); });
               if (making.status == Status::Ok) continue;
               making.hint = making.status == Status::ErrorCreatingFile
                                 ? ReasonSentence()

@@ -73,11 +73,11 @@ int RunTurnCommand(const TurnOptions& options, const CommandContext& context) {
       .request = {.turn = Composed(TurnNamed(options.rotate), TurnNamed(options.flip)),
                   .seenByExif = options.byExif || settings.ExifAdjustOrientation != 0,
                   .trim = options.trim,
-                  .keepTime = options.keepTimes},
+                  .keepTime = options.keepTimes,
+                  .dryRun = options.dryRun},
       .inPlace = options.inPlace,
       .keepTree = options.keepTree,
-      .jobs = static_cast<uint32_t>(options.jobs),
-      .dryRun = options.dryRun};
+      .jobs = static_cast<uint32_t>(options.jobs)};
   BatchJob job = NewBatchJob();
   job.destinationFolder = options.dest;
   job.overwrite.prompt = options.overwrite != "replace";
@@ -87,7 +87,7 @@ int RunTurnCommand(const TurnOptions& options, const CommandContext& context) {
   TerminalBox box(output, true, false);
   job.box = &box;
   (void)RunTurn(selection->files, function, job);  // this box always opens
-  return FinishBatch(job);
+  return FinishBatch(job, context);
 }
 
 }  // namespace

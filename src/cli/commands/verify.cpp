@@ -6,7 +6,6 @@
 #include "batch/picture_failure.h"
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
-#include "cli/frame/used_files.h"
 #include "cli/selection/file_selection.h"
 #include "registry/registry.h"
 #include "settings/job_options.h"
@@ -59,7 +58,6 @@ int RunVerify(const VerifyOptions& options, const CommandContext& context) {
   ResultOutput output(context, options.json);
   output.CloseWith(selection->leftOut);
   output.Expect(selection->files.size());
-  UsedFiles used(FileFunction::View);
   for (const SelectedFile& file : selection->files) {
     if (!output.GoesOn()) break;
     std::string hint = file.hint, note;
@@ -76,7 +74,6 @@ int RunVerify(const VerifyOptions& options, const CommandContext& context) {
       continue;
     }
     output.CountFile();
-    used.Add(file.name);
     if (!output.IsJson()) output.Line(output.Shown(file.name) + ": " + StatusText(status));
     if (options.verbose && !note.empty())
       output.Note(output.Shown(file.name) + ": " + output.Shown(note));

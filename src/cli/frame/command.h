@@ -47,6 +47,7 @@ struct GlobalOptions {
   bool quiet = false;
   bool noInput = false;
   bool noPlugins = false;
+  bool noHistory = false;
   std::string progress = "auto";  // auto, never
   std::string color = "auto";     // auto, always, never
   std::string language;           // as in StartTexts; it counts before anything is parsed

@@ -53,6 +53,7 @@ void AddGlobalOptions(CLI::App& app, GlobalOptions& global) {
   AddFlag(app, "-q,--quiet", global.quiet, "No progress bar, notes or summary");
   AddFlag(app, "--no-input", global.noInput, "Never ask questions");
   AddFlag(app, "--no-plugins", global.noPlugins, "Do not load plug-ins");
+  AddFlag(app, "--no-history", global.noHistory, "Do not record files in the file history");
   AddChoice(app, "--progress", global.progress, "WHEN",
             "Progress bar: auto (on a terminal) or never", {"auto", "never"});
   AddChoice(app, "--color", global.color, "WHEN",

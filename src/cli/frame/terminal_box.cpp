@@ -37,9 +37,10 @@ void TerminalBox::ShowElement(const FileOutcome& outcome) {
   output_.Element(element);
 }
 
-int FinishBatch(const BatchJob& job) {
+int FinishBatch(const BatchJob& job, const CommandContext& context) {
   // a history that cannot be written is no failure
-  if (!job.uses.empty()) (void)UpdateFileHistory(HistoryOptionsFromSettings(), job.uses);
+  if (!job.uses.empty() && !context.global.noHistory)
+    (void)UpdateFileHistory(HistoryOptionsFromSettings(), job.uses);
   return job.errors || job.writeAborts > 0 ? kExitFailed : kExitOk;
 }
 

@@ -30,8 +30,8 @@ class TerminalBox : public ProgressBox {
   const bool tellReplaced_;
 };
 
-// Records a batch in the file history. Returns the exit status of its command: kExitFailed if a
-// file failed or got no name.
-int FinishBatch(const BatchJob& job);
+// Records a batch in the file history, unless --no-history is given. Returns the exit status of its
+// command: kExitFailed if a file failed or got no name.
+int FinishBatch(const BatchJob& job, const CommandContext& context);
 
 }  // namespace fotomill::cli

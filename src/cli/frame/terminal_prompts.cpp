@@ -115,14 +115,4 @@ std::optional<std::string> TerminalPrompts::AskPassword(const std::string& path)
   return line && line->empty() ? std::nullopt : line;
 }
 
-bool TerminalPrompts::ConfirmNewFolder(const std::string& folder) {
-  for (;;) {
-    // Translators: "y" and "n" may be other letters, one each; name them in this question, too.
-    const auto line = Ask(Tr("Folder \"%1\" does not exist. Create it? [%2/%3]",
-                             EscapeControls(folder), Tr("y"), Tr("n")));
-    if (!line || *line == "n" || *line == Tr("n")) return false;
-    if (line->empty() || *line == "y" || *line == Tr("y")) return true;
-  }
-}
-
 }  // namespace fotomill::cli

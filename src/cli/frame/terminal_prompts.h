@@ -22,7 +22,7 @@ class TerminalPrompts : public Prompts {
   OverwriteAnswer AskOverwrite(const OverwriteQuestion& question) override;
   std::optional<std::string> AskPassword(const std::string& path) override;
   bool ConfirmFormat(const std::string&) override { return true; }  // named on the command line
-  bool ConfirmNewFolder(const std::string& folder) override;
+  bool ConfirmNewFolder(const std::string&) override { return true; }  // likewise
 
  private:
   // Prints a question and reads the answer, without line end and surrounding blanks; nullopt at the

@@ -8,16 +8,17 @@
 namespace fotomill::cli {
 
 void UsedFiles::Add(const std::string& name) {
-  if (!function_ || (settings.FileHistoryFunctions >> static_cast<int32_t>(*function_) & 1) == 0)
-    return;
+  const auto function = static_cast<uint32_t>(function_);
+  const bool recorded = (static_cast<uint32_t>(settings.FileHistoryFunctions) >> function & 1) != 0;
+  if (!on_ || !recorded) return;
   const std::string_view fileName = platform::FileNameOf(name);
   const std::string folder = name.substr(0, name.size() - fileName.size());
   if (uses_.empty() || folder != folder_) {  // a batch has many files of one folder
     folder_ = folder;
     absoluteFolder_ = platform::AbsolutePath(folder.empty() ? "." : folder);
   }
-  uses_.push_back(
-      {platform::JoinFolder(absoluteFolder_, fileName), *function_, kOwnTime, static_cast<int32_t>(platform::Now()), false});
+  uses_.push_back({platform::JoinFolder(absoluteFolder_, fileName), function_, kOwnTime,
+                   static_cast<int32_t>(platform::Now()), false});
 }
 
 }  // namespace fotomill::cli

@@ -1,6 +1,5 @@
 #pragma once
 
-#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -14,8 +13,8 @@ namespace fotomill::cli {
 // Failing to write the history is not a failure of the command.
 class UsedFiles {
  public:
-  // Without a function nothing is recorded.
-  explicit UsedFiles(std::optional<FileFunction> function) : function_(function) {}
+  // Nothing is recorded unless `on`: dry runs, --no-history.
+  UsedFiles(FileFunction function, bool on) : on_(on), function_(function) {}
   UsedFiles(const UsedFiles&) = delete;
   UsedFiles& operator=(const UsedFiles&) = delete;
   ~UsedFiles() {
@@ -26,7 +25,8 @@ class UsedFiles {
   void Add(const std::string& name);
 
  private:
-  std::optional<FileFunction> function_;
+  const bool on_;
+  const FileFunction function_;
   std::vector<FileUse> uses_;
   std::string folder_, absoluteFolder_;  // of the last file
 };

@@ -95,6 +95,18 @@ bool MayBecome(const std::string& path, mode_t& mode) {
   return faccessat(AT_FDCWD, path.c_str(), W_OK, AT_EACCESS) == 0;
 }
 
+// The nearest folder of a path that is there, or what is there in place of one.
+std::string FolderThatExists(std::string path) {
+  struct stat facts;
+  do {
+    const size_t end = path.find_last_not_of('/');
+    const size_t slash = end == std::string::npos ? end : path.rfind('/', end);
+    if (slash == std::string::npos) return path.starts_with('/') ? "/" : ".";
+    path.resize(std::max<size_t>(slash, 1));
+  } while (lstat(path.c_str(), &facts) != 0 && errno == ENOENT);
+  return path;
+}
+
 CommitResult SayChanged(const std::string& path) {
   HeldFile::SetChanged(path);
   KeepReason("The file was changed by another program");
@@ -102,6 +114,16 @@ CommitResult SayChanged(const std::string& path) {
 }
 
 }  // namespace
+
+bool MayCreate(const std::string& path) {
+  ForgetReason();
+  mode_t mode = 0;
+  const bool may =
+      MayBecome(path, mode) &&
+      faccessat(AT_FDCWD, (FolderThatExists(path) + "/").c_str(), W_OK | X_OK, AT_EACCESS) == 0;
+  if (!may) KeepErrno();
+  return may;
+}
 
 bool OutputFile::Create(const std::string& path) {
   Discard();
