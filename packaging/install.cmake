@@ -28,6 +28,10 @@ install(FILES ${printed}/fish DESTINATION ${CMAKE_INSTALL_DATADIR}/fish/vendor_c
 # Beside the libraries of no architecture's own folder: the program looks for ../lib/fotomill/plugin from where it lies.
 install(TARGETS FMWPL_pnm LIBRARY DESTINATION lib/fotomill/plugin COMPONENT plugins)
 
+if(TARGET fotomill-faces)
+  install(TARGETS fotomill-faces LIBRARY DESTINATION lib/fotomill COMPONENT plugins)
+endif()
+
 if(TARGET fotomill-desktop)
   set(desktop_files ${packaging_folder}/desktop)
   install(TARGETS fotomill-desktop DESTINATION ${CMAKE_INSTALL_BINDIR} COMPONENT desktop)

@@ -15,6 +15,7 @@
 #include "picture/encode_options.h"
 #include "picture/picture_record.h"
 #include "picture/read_request.h"
+#include "processing/faces/face_options.h"
 #include "processing/palette/reduce.h"
 #include "texts/texts.h"
 
@@ -94,6 +95,7 @@ struct BatchJob {
   NamingOptions naming;
   ReadOptions read;      // of sources
   EncodeOptions encode;  // of outputs
+  FaceOptions faces;     // of operations that look for faces
   ReduceOptions reduction;          // of outputs whose format takes fewer colors
   ProgressSettings boxSettings;
   // FileHistoryFunctions: a bit for each function whose files are recorded

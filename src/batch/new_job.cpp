@@ -58,6 +58,7 @@ KeyNumber NumberOf(Remembered what) {
 BatchJob NewBatchJob() {
   BatchJob job;
   job.overwrite = OverwritePolicyFromSettings();
+  job.faces = FaceOptionsFromSettings();
   job.naming = NamingOptionsFromSettings();
   job.read = ReadOptionsFromSettings();
   job.encode = EncodeOptionsFromSettings();

@@ -14,6 +14,7 @@ namespace {
 struct RecipeRun {
   std::shared_ptr<const Recipe> recipe;
   std::string copyrightHolder;
+  FaceOptions faces;
   uint32_t threads = 0;
   StopToken stop;
 
@@ -26,7 +27,8 @@ struct RecipeRun {
     if (steps.empty()) return Status::Ok;
     return ApplySteps(picture, steps,
                       {.work = {.threads = threads, .goesOn = [this] { return !stop.Asked(); }},
-                       .facts = FactsOf(std::string(picture.fileName.view()))});
+                       .facts = FactsOf(std::string(picture.fileName.view())),
+                       .faces = faces});
   }
 };
 
@@ -58,7 +60,7 @@ FileFunction FunctionOfFamily(Family family) {
 std::string SetRecipe(std::shared_ptr<const Recipe> recipe, const std::string& copyrightHolder,
                       const BatchJob& job, const FormatLookup& lookup, BatchFunction& function) {
   const auto run = std::make_shared<RecipeRun>(
-      RecipeRun{recipe, copyrightHolder, function.jobs == 1 ? 1u : 0u, job.stop.Token()});
+      RecipeRun{recipe, copyrightHolder, job.faces, function.jobs == 1 ? 1u : 0u, job.stop.Token()});
   function.transform = [run](PictureRecord& picture) {
     return run->Apply(picture, run->recipe->common);
   };

@@ -51,6 +51,9 @@ CHOICES(kMonoDitherChoices,
 CHOICES(kMonoModeChoices,
     CHOICE("Black and white", kMonoBlackWhite),
     CHOICE("Shades of gray",  kMonoGray));
+CHOICES(kFaceChoices,
+    CHOICE("The largest face", kLargestFace),
+    CHOICE("All faces",        kAllFaces));
 CHOICES(kExtensionCaseChoices,
     CHOICE("As in the source file's name", kCaseOfSource),
     CHOICE("Upper case",                   kCaseUpper),

@@ -44,6 +44,8 @@ enum Dithering : int32_t { kDitherNone = 0, kDitherOrdered = 1, kDitherFloydStei
 // FXMonomode: what color pictures become, black and white or FXGrayLevel shades of gray (0: all
 // that the depth has).
 enum MonoMode : int32_t { kMonoBlackWhite = 0, kMonoGray = 1 };
+// FaceDetectThumbnailMultiple: what thumbnails that show faces show.
+enum ShownFaces : int32_t { kLargestFace = 0, kAllFaces = 1 };
 // ExtensionCaseStyle: letter case of written extensions.
 enum ExtensionCase : int32_t { kCaseOfSource = 0, kCaseUpper = 1, kCaseLower = 2 };
 // DefaultThumbnailMode and a folder's ThumbnailMode: where thumbnails live.
@@ -121,7 +123,7 @@ extern const ChoiceEntry kDateModeChoices[], kDistanceUnitChoices[], kDitherChoi
     kDropChoices[], kExtensionCaseChoices[], kFrameBackgroundChoices[], kHistoryLimitChoices[],
     kHistorySortChoices[], kHistoryThumbnailChoices[], kIconCompressionChoices[],
     kJpegProcessorChoices[], kJpegSubsampleChoices[], kLengthUnitChoices[], kMonoDitherChoices[],
-    kMonoModeChoices[], kMovieCodecChoices[], kPhotoCdChoices[], kResampleChoices[],
+    kFaceChoices[], kMonoModeChoices[], kMovieCodecChoices[], kPhotoCdChoices[], kResampleChoices[],
     kSizeModeChoices[], kSortModeChoices[], kThumbnailModeChoices[], kTiffCompressionChoices[],
     kViewModeChoices[], kViewZoomChoices[];
 

@@ -15,7 +15,8 @@ OperationContext ContextOf(const EngineOptions& options) {
   return {.work = options.work,
           .expand = [&options](const std::string& text, const PictureRecord& picture) {
             return ExpandMacros(text, options.facts, picture);
-          }};
+          },
+          .faces = options.faces};
 }
 
 // How many point operations stand at the start of the steps.

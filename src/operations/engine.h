@@ -5,6 +5,7 @@
 #include "operations/macros.h"
 #include "operations/recipe.h"
 #include "picture/rectangle.h"
+#include "processing/faces/face_options.h"
 
 namespace fotomill {
 
@@ -14,6 +15,7 @@ namespace fotomill {
 struct EngineOptions {
   Work work;
   MacroFacts facts;  // for the macros in texts
+  FaceOptions faces = {};  // for operations that look for faces
 };
 
 // Applies steps one after the other. Neighboring point operations are fused into one pass,

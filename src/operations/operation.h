@@ -11,6 +11,7 @@
 #include "picture/picture_record.h"
 #include "processing/bands.h"
 #include "processing/color/point_effect.h"
+#include "processing/faces/face_options.h"
 
 // One row per operation: this is all that the command line, recipes, dialogs and tests know of it.
 //
@@ -49,6 +50,7 @@ struct OperationContext {
   int32_t left = 0, top = 0;
   Size whole{0, 0};
   TextExpander expand = {};  // empty: texts are taken as they are
+  FaceOptions faces = {};    // for operations that look for faces
 
   // A text with its macros replaced by facts of the picture.
   std::string Expanded(const std::string& text, const PictureRecord& picture) const {

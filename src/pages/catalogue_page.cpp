@@ -18,6 +18,7 @@
 #include "platform/folders.h"
 #include "platform/paths.h"
 #include "platform/process.h"
+#include "processing/faces/face_finder.h"
 #include "processing/palette/reduce.h"
 #include "registry/registry.h"
 #include "texts/system_reason.h"
@@ -107,7 +108,8 @@ class ContactSheet {
   void Draw(FileOutcome& outcome, PackedImage& image) const {
     const ReadRequest request{
         .fileName = outcome.source,
-        .thumbnailSide = std::max(options_.look.cellWidth, options_.look.cellHeight),
+        .thumbnailSide = std::max({options_.look.cellWidth, options_.look.cellHeight,
+                                   options_.onFaces ? kFramingSide : 0}),
         .stop = stop_,
         .options = job_.read};
     PicturePointer picture;
@@ -120,6 +122,8 @@ class ContactSheet {
   Status DrawPicture(const ReadRequest& request, PictureRecord& picture, PackedImage& image) const {
     RETURN_IF_BAD(ReadPicture(request, picture));
     if (options_.upright) RETURN_IF_BAD(TurnUpright(picture));
+    if (options_.onFaces)
+      RETURN_IF_BAD(FrameOnFaces(picture, job_.faces, true, [this] { return !stop_.Asked(); }));
     return MakeCellImage(picture, options_.look, image);
   }
 

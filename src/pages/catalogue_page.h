@@ -36,6 +36,7 @@ struct ContactSheetOptions {
   CataloguePageOptions page;
   std::string fontName = "Arial";  // of the names
   bool upright = true;             // pictures are turned as their EXIF says
+  bool onFaces = false;            // cells show the faces of their pictures
   std::string reduceHint = {};  // goes behind "Too many colors."
   uint32_t jobs = 0;            // pictures in progress at a time; 0: one per core
 };

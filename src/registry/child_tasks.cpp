@@ -2,6 +2,7 @@
 
 #include <algorithm>
 
+#include "processing/faces/face_finder.h"
 #include "registry/format_table.h"
 
 namespace fotomill {
@@ -14,7 +15,7 @@ std::vector<platform::ApartTask> ChildTasks() {
         found.push_back(row.childTask);
     }
   }
-  std::vector<platform::ApartTask> tasks;
+  std::vector<platform::ApartTask> tasks = {{kFacesTask, FindFacesApart}};
   for (const platform::ApartTask* task : found) tasks.push_back(*task);
   return tasks;
 }

@@ -8,6 +8,7 @@
 #include "metadata/gps.h"
 #include "picture/encode_options.h"
 #include "picture/read_request.h"
+#include "processing/faces/face_options.h"
 #include "processing/palette/reduce.h"
 #include "settings/configuration.h"
 #include "settings/key_table.h"
@@ -92,6 +93,11 @@ HistoryOptions HistoryOptionsFromSettings() {
           .name = std::string(settings.FileHistoryDatabase)};
 }
 
+FaceOptions FaceOptionsFromSettings() {
+  return {.cascade = std::string(settings.FaceDetectThumbnailCascade),
+          .smallestPercent = settings.FaceDetectPercentage};
+}
+
 ThumbnailOptions ThumbnailOptionsFromSettings() {
   return {.quick = settings.ThumbnailQuickResize != 0,
           .matte = static_cast<Color>(settings.ThumbnailMatte),
@@ -101,6 +107,10 @@ ThumbnailOptions ThumbnailOptionsFromSettings() {
           .keep = settings.AutoCreateThumbnail != 0,
           .fastZoom = settings.FastZoomedThumbnails != 0,
           .zoomFilter = settings.ThumbnailZoomFilter,
+          .onFaces = settings.FaceDetectThumbnailEnable != 0,
+          .onFacesUnkept = settings.FaceDetectVirtualThumbnails != 0,
+          .onAllFaces = settings.FaceDetectThumbnailMultiple != choice::kLargestFace,
+          .faces = FaceOptionsFromSettings(),
           .read = ReadOptionsFromSettings()};
 }
 

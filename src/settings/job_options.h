@@ -10,6 +10,7 @@ struct GpsLocation;
 struct HistoryOptions;
 struct ReadOptions;
 struct ReduceOptions;
+struct FaceOptions;
 struct ThumbnailOptions;
 struct ThumbnailUpdateOptions;
 
@@ -35,6 +36,7 @@ choice::DistanceUnit DistanceUnitFromSettings();
 [[nodiscard]] bool GpsLocationFromSettings(GpsLocation& location);
 
 HistoryOptions HistoryOptionsFromSettings();  // the keys that HistoryOptions names
+FaceOptions FaceOptionsFromSettings();
 ThumbnailOptions ThumbnailOptionsFromSettings();  // the keys that ThumbnailOptions names
 ThumbnailUpdateOptions ThumbnailUpdateOptionsFromSettings();  // the keys that it names
 // Takes up what the user chose in the offer to update thumbnails.

@@ -10,6 +10,7 @@
 #include "platform/output_file.h"
 #include "platform/paths.h"
 #include "registry/registry.h"
+#include "processing/faces/face_finder.h"
 
 namespace fotomill {
 
@@ -77,9 +78,12 @@ Status MakeThumbnailOfFile(const std::string& picturePath, const ThumbnailOption
                            ThumbnailRecord& record) {
   PicturePointer picture;
   // The quick scaler's result depends on the size that it starts from.
-  const int32_t side = options.quick ? 0 : kSmallThumbnailSide;
+  const int32_t side = options.quick     ? 0
+                       : options.onFaces ? kFramingSide
+                                         : kSmallThumbnailSide;
   RETURN_IF_BAD(LoadPicture({.fileName = picturePath, .thumbnailSide = side, .options = options.read}, picture));
   if (picture->image.Empty()) return Status::EmptyImage;
+  if (options.onFaces) RETURN_IF_BAD(FrameOnFaces(*picture, options.faces, options.onAllFaces));
   return MakeThumbnailRecord(record, *picture, options) ? Status::Ok
                                                         : Status::MemoryAllocationError;
 }

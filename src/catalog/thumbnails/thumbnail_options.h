@@ -5,6 +5,7 @@
 #include "core/choice_lists.h"
 #include "picture/palette.h"
 #include "picture/read_request.h"
+#include "processing/faces/face_options.h"
 
 namespace fotomill {
 
@@ -18,6 +19,10 @@ struct ThumbnailOptions {
   bool keep = true;         // what was made for a browser goes into its database
   bool fastZoom = false;    // small records are enlarged by spreading their pixels
   int32_t zoomFilter = choice::kBicubic;  // else by this choice::ResampleFilter
+  bool onFaces = false;        // stored ones show the largest face
+  bool onFacesUnkept = false;  // so do those that are made for a browser and not stored
+  bool onAllFaces = false;     // all faces instead of the largest
+  FaceOptions faces = {};
   ReadOptions read = {};                  // how the pictures are decoded
 
   bool operator==(const ThumbnailOptions&) const = default;

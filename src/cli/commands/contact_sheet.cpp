@@ -91,6 +91,7 @@ int RunSheet(const SheetOptions& options, const CommandContext& context) {
   BatchJob job = NewBatchJob();
   job.remember = nullptr;
   ContactSheetOptions sheet;
+  sheet.onFaces = settings.CatalogFacedetectOptions != 0;
   sheet.fontName = settings.CatalogFontName.view();
   sheet.upright = settings.ExifAdjustOrientation != 0;
   if (const std::string wrong = ReadDestinationFormat(options.to, job); !wrong.empty())

@@ -5,6 +5,7 @@
 #include "cli/commands/convert.h"
 #include "cli/commands/doctor.h"
 #include "cli/commands/exif.h"
+#include "cli/commands/faces.h"
 #include "cli/commands/formats.h"
 #include "cli/commands/history.h"
 #include "cli/commands/info.h"
@@ -40,6 +41,7 @@ constexpr Command kCommands[] = {
     {"formats", TrLater("list the formats and what this build can do with them"),       Needs::Formats,  SetUpFormats},
     {"match",   TrLater("show which format a file name selects, without opening it"),   Needs::Formats,  SetUpMatch},
     {"exif",    TrLater("show EXIF, or extract the embedded thumbnail"),                Needs::Formats,  SetUpExif},
+    {"faces",   TrLater("find faces in pictures"),                                      Needs::Formats,  SetUpFaces},
     {"plugins", TrLater("list the plug-in formats"),                                    Needs::Settings, SetUpPlugins},
     {"verify",  TrLater("decode files completely to find damaged ones"),                Needs::Formats,  SetUpVerify},
     {"config list",  TrLater("list the configuration keys and their values"),           Needs::Settings, SetUpConfigList},

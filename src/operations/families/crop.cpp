@@ -5,6 +5,7 @@
 #include "operations/backdrop.h"
 #include "operations/gravity.h"
 #include "operations/operations.h"
+#include "processing/faces/face_finder.h"
 #include "processing/geometry/canvas.h"
 #include "processing/geometry/cut.h"
 
@@ -15,17 +16,38 @@ namespace {
 
 using enum ParameterKind;
 
+// The nine places and, as the last choice, the faces.
+constexpr char kGravitiesAndFaces[] =
+    "center|top|bottom|left|right|top-left|top-right|bottom-left|bottom-right|faces";
+constexpr int32_t kToFaces = 9;
+
 constexpr Parameter kCrop[] = {
     {.name = "area", .kind = kRectangle, .unit = "px", .least = -1e9, .most = 1e9, .label = "Area",
      .help = "WxH+X+Y from the top left; WxH or a ratio such as 3:2 is placed by gravity."},
-    {.name = "gravity", .kind = kChoice, .preset = "center", .choices = kGravities, .label = "Place",
-     .help = "Which part to keep of an area without a place."},
+    {.name = "gravity", .kind = kChoice, .preset = "center", .choices = kGravitiesAndFaces, .label = "Place",
+     .help = "Which part to keep of an area without a place; faces: the part around the faces, the center where there are none."},
 };
 
-Status Crop(PictureRecord& picture, const Arguments& arguments, const OperationContext&) {
+// Moves an area so that the middle of the faces comes as close to its middle as the picture allows.
+Status MoveToFaces(const PictureRecord& picture, const OperationContext& context, Rectangle& area) {
+  std::vector<Rectangle> faces;
+  RETURN_IF_BAD(FindFaces(picture.image, context.faces, faces, context.work.goesOn));
+  if (faces.empty()) return Status::Ok;
+  const int32_t width = picture.image.Width(), height = picture.image.Height();
+  const Rectangle around = AroundFaces(faces, width, height);
+  area.x = std::clamp(around.x + (around.width - area.width) / 2, 0, std::max(0, width - area.width));
+  area.y = std::clamp(around.y + (around.height - area.height) / 2, 0, std::max(0, height - area.height));
+  return Status::Ok;
+}
+
+Status Crop(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
   const Size whole{picture.image.Width(), picture.image.Height()};
-  return CutPicture(picture, AreaOf(arguments.Of("area"), whole, picture.metadata,
-                                    arguments.Choice<Gravity>("gravity")));
+  const bool toFaces = arguments.Choice<int32_t>("gravity") == kToFaces;
+  const Value& wanted = arguments.Of("area");
+  Rectangle area = AreaOf(wanted, whole, picture.metadata,
+                          toFaces ? Gravity::Center : arguments.Choice<Gravity>("gravity"));
+  if (toFaces && !wanted.hasPlace) RETURN_IF_BAD(MoveToFaces(picture, context, area));
+  return CutPicture(picture, area);
 }
 
 constexpr Parameter kTrim[] = {

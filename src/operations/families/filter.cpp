@@ -1,3 +1,4 @@
+#include <algorithm>
 #include <charconv>
 #include <cmath>
 #include <cstring>
@@ -5,6 +6,7 @@
 
 #include "operations/area.h"
 #include "operations/operations.h"
+#include "processing/faces/face_finder.h"
 #include "processing/filters/box_blur.h"
 #include "processing/filters/convolve.h"
 #include "processing/filters/gaussian.h"
@@ -251,16 +253,35 @@ Status Mosaic(PictureRecord& picture, const Arguments& arguments, const Operatio
 int32_t ReachOfMosaic(const Arguments& arguments) { return arguments.Integer("size"); }
 
 constexpr Parameter kRedEye[] = {
-    {.name = "area", .kind = kRectangle, .unit = "px", .label = "Area", .help = "WxH+X+Y around the eyes."},
+    {.name = "area", .kind = kRectangle, .unit = "px", .preset = "", .label = "Area", .help = "WxH+X+Y around the eyes; the whole picture where faces are looked for."},
     {.name = "sensitivity", .kind = kPercent, .unit = "%", .preset = "50", .least = 0, .most = 100, .label = "Sensitivity",
      .help = "How little red is enough."},
+    {.name = "faces", .kind = kFlag, .preset = "no", .label = "In faces", .help = "Only in the faces within the area."},
 };
 
 Status RedEye(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
-  return RemoveRedEye(picture, AreaOfPart(picture, arguments.Of("area"), context),
-                      2.6 - arguments.Number("sensitivity") / 50);
+  const Rectangle area = arguments.Has("area")
+                             ? AreaOfPart(picture, arguments.Of("area"), context)
+                             : Rectangle{0, 0, picture.image.Width(), picture.image.Height()};
+  const double ratio = 2.6 - arguments.Number("sensitivity") / 50;
+  if (!arguments.Flag("faces")) return RemoveRedEye(picture, area, ratio);
+  std::vector<Rectangle> faces;
+  RETURN_IF_BAD(FindFaces(picture.image, context.faces, faces, context.work.goesOn));
+  for (const Rectangle& face : faces) {
+    const int32_t left = std::max(face.x, area.x), top = std::max(face.y, area.y);
+    const int32_t right = std::min(face.x + face.width, area.x + area.width);
+    const int32_t bottom = std::min(face.y + face.height, area.y + area.height);
+    if (right > left && bottom > top)
+      RETURN_IF_BAD(RemoveRedEye(picture, {left, top, right - left, bottom - top}, ratio));
+  }
+  return Status::Ok;
 }
-int32_t NoReach(const Arguments&) { return 0; }
+ArgumentProblem CheckRedEye(const Arguments& arguments) {
+  if (arguments.Has("area") || arguments.Flag("faces")) return {};
+  return {"area", "must be given, or faces"};
+}
+// Faces are looked for in the whole picture.
+int32_t ReachOfRedEye(const Arguments& arguments) { return arguments.Flag("faces") ? 1 << 24 : 0; }
 
 constexpr Operation kOperations[] = {
     {.name = "blur",
@@ -416,7 +437,8 @@ constexpr Operation kOperations[] = {
      .parameters = kRedEye,
      .works = Works::Neighborhood,
      .apply = RedEye,
-     .reach = NoReach},
+     .reach = ReachOfRedEye,
+     .check = CheckRedEye},
 };
 
 }  // namespace

@@ -15,6 +15,7 @@
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "processing/geometry/scale.h"
+#include "processing/faces/face_finder.h"
 #include "registry/registry.h"
 
 namespace fotomill::desktop {
@@ -175,12 +176,17 @@ void ReadPages(const std::string& path, const ReadOptions& options, Thumbnail& t
 
 Status MakeFromPicture(const ThumbnailRequest& request, Thumbnail& thumbnail) {
   PicturePointer picture;
-  const ReadRequest read{
-      .fileName = request.path, .thumbnailSide = request.side, .options = request.options.read};
+  const bool onFaces =
+      InDatabase(request) ? request.options.onFaces : request.options.onFacesUnkept;
+  const ReadRequest read{.fileName = request.path,
+                         .thumbnailSide = onFaces ? std::max(request.side, kFramingSide) : request.side,
+                         .options = request.options.read};
   RETURN_IF_BAD(LoadPictureInfo(read, picture));
   CopyFacts(*picture, thumbnail);
   RETURN_IF_BAD(ReadPicture(read, *picture));
   thumbnail.alpha = !picture->alpha.Empty();
+  if (onFaces)
+    RETURN_IF_BAD(FrameOnFaces(*picture, request.options.faces, request.options.onAllFaces));
   RETURN_IF_BAD(PrepareForDisplay(*picture, request.options.matte));
   ThumbnailRecord record;
   if (InDatabase(request) && request.options.keep &&
