@@ -341,8 +341,12 @@ Status JpegInfo(PictureRecord& picture, const ReadRequest& request) {
   platform::FileView file;
   if (!file.Open(request.fileName)) return Status::FileOpenError;
   picture.fileSize = file.FileSize();
+  return JpegStreamInfo(picture, {file.Bytes()});
+}
+
+Status JpegStreamInfo(PictureRecord& picture, const JpegStream& stream) {
   JpegReader reader;
-  RETURN_IF_BAD(ReadJpegHeader(reader, file.Bytes()));
+  RETURN_IF_BAD(ReadJpegHeader(reader, stream.data, stream.tables));
   return DescribePicture(reader, picture);
 }
 
@@ -350,12 +354,17 @@ Status JpegRead(PictureRecord& picture, const ReadRequest& request) {
   const ProgressScope progress(picture);
   picture.image.Free();
   picture.alpha.Free();
-  picture.warning.Clear();
-  picture.note.Clear();
   platform::FileView file;
   if (!file.Open(request.fileName)) return Status::FileOpenError;
+  return JpegStreamRead(picture, request, {file.Bytes()}, file);
+}
+
+Status JpegStreamRead(PictureRecord& picture, const ReadRequest& request, const JpegStream& stream,
+                      const platform::FileView& file) {
+  picture.warning.Clear();
+  picture.note.Clear();
   JpegReader reader;
-  RETURN_IF_BAD(ReadJpegHeader(reader, file.Bytes()));
+  RETURN_IF_BAD(ReadJpegHeader(reader, stream.data, stream.tables));
   RETURN_IF_BAD(DescribePicture(reader, picture));
   if (!Guarded(reader.errors, [&] { SetOutput(reader.info, request.thumbnailSide); }))
     return reader.Failure();
@@ -392,8 +401,12 @@ Status JpegDetails(PictureRecord& picture) {
   picture.detailLines.Clear();
   platform::FileView file;
   if (!file.Open(picture.fileName.c_str())) return Status::FileOpenError;
+  return JpegStreamDetails(picture, {file.Bytes()});
+}
+
+Status JpegStreamDetails(PictureRecord& picture, const JpegStream& stream) {
   JpegReader reader;
-  RETURN_IF_BAD(ReadJpegHeader(reader, file.Bytes()));
+  RETURN_IF_BAD(ReadJpegHeader(reader, stream.data, stream.tables));
   TakeMetadata(reader, picture);
   AddDetails(reader.info, picture, picture.detailLines);
   return Status::Ok;

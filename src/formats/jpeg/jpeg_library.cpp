@@ -97,7 +97,8 @@ Status JpegErrors::Meaning(j_common_ptr common) {
   return endMissing ? Status::FileReadError : Status::DamagedFile;
 }
 
-Status ReadJpegHeader(JpegReader& reader, std::span<const uint8_t> file) {
+Status ReadJpegHeader(JpegReader& reader, std::span<const uint8_t> file,
+                      std::span<const uint8_t> tables) {
   if (file.size() < 4) return Status::FileReadError;
   if (file[0] != 0xFF || file[1] != 0xD8) return Status::DamagedFile;
   reader.segments.clear();
@@ -106,6 +107,10 @@ Status ReadJpegHeader(JpegReader& reader, std::span<const uint8_t> file) {
     jpeg_create_decompress(&reader.info);
     reader.info.client_data = &reader;
     reader.info.progress = &reader.monitor;
+    if (!tables.empty()) {
+      jpeg_mem_src(&reader.info, tables.data(), tables.size());
+      jpeg_read_header(&reader.info, FALSE);
+    }
     jpeg_mem_src(&reader.info, file.data(), file.size());
     jpeg_read_header(&reader.info, TRUE);
   });

@@ -59,8 +59,10 @@ struct JpegReader {
 };
 
 // Reads a file up to its first scan, keeping the segments of EXIF, XMP, profiles and comments.
-// `file` must stay until the reader is done.
-Status ReadJpegHeader(JpegReader& reader, std::span<const uint8_t> file);
+// `file` must stay until the reader is done. `tables` is an abbreviated stream, or empty: tables
+// that count where the file has none. Huffman tables that both lack are those of T.81, K.3.
+Status ReadJpegHeader(JpegReader& reader, std::span<const uint8_t> file,
+                      std::span<const uint8_t> tables = {});
 
 // Bytes of the arrays in which the library holds all coefficients of a picture: always for `all`,
 // else only where its scans come one after the other, whatever the size that it is decoded at.
