@@ -59,7 +59,7 @@ constexpr Place kPlaces[] = {
     {"MAC"},
     {"MOV", "(MOV) QuickTime movies", 1, 24, FMT_BITMAP | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES},
     {"MSP"},
-    {"PCD", "(PCD) Kodak Photo-CD", 1, 24, FMT_BITMAP | FMT_MEDIA},
+    {"PCD"},
     {"PCX"},
     {"PDD"},
     {"PIC", "(PIC) GLPaint/Pegasus", 1, 24, FMT_BITMAP},

@@ -1,0 +1,39 @@
+#include "formats/rows.h"
+
+#include "formats/photocd/pcd.h"
+#include "texts/texts.h"
+
+namespace fotomill {
+
+namespace {
+
+using namespace std::string_view_literals;
+
+constexpr Signature kSignatures[] = {{0, "PCD_OPA"sv, TrLater("a Photo CD overview")}};
+
+constexpr FormatSetting kKeys[] = {{"PhotoCDResolution", TrLater("Photo CD: largest size read")}};
+constexpr FormatSettings kSettings = {"PCD", "OverridePcdBox", TrLater("Other formats"), kKeys};
+
+Status CannotWrite(PictureRecord&, const WriteOptions&) { return Status::UnsupportedFunction; }
+
+constexpr FormatEntry kRows[] = {{
+    .details = PcdDetails,
+    .info = PcdInfo,
+    .read = PcdRead,
+    .write = CannotWrite,
+    .maxBits = 24,
+    .extension = "PCD"sv,
+    .description = "(PCD) Kodak Photo-CD"sv,
+    .enabled = 1,
+    .flags = FMT_BITMAP | FMT_MEDIA,
+    .canRead = true,
+    .whyNot = kOnlyRead,
+    .signatures = kSignatures,
+    .settings = &kSettings,
+}};
+
+}  // namespace
+
+std::span<const FormatEntry> PhotoCdRows() { return kRows; }
+
+}  // namespace fotomill
