@@ -23,8 +23,6 @@ struct SignatureOfRow {
 // of ours.
 // clang-format off
 constexpr SignatureOfRow kWithoutCodec[] = {
-    {"PIC",  {0, "\xff\xd8\xff"sv}},
-    {"KQP",  {0, "\xff\xd8\xff"sv}},
     {"AVI",  {0, "RIFF"sv, "AVI", 8, "AVI "sv}},
     {"WAV",  {0, "RIFF"sv, "WAV", 8, "WAVE"sv}},
     {"ANI",  {0, "RIFF"sv, TrLater("an animated cursor"), 8, "ACON"sv}},
@@ -55,6 +53,7 @@ constexpr SignatureOfRow kWithoutCodec[] = {
     {"XCF",  {0, "gimp xcf"sv, "GIMP XCF"}},
     {"",     {0, "FORM"sv, TrLater("IFF animation"), 8, "ANIM"sv}},
     {"QOI",  {0, "qoif"sv, "QOI"}},
+    {"",     {0, "\x53\x80\xf6\x34"sv, "Softimage PIC"}},
     {"FLIF", {0, "FLIF"sv, "FLIF"}},
     {"ICNS", {0, "icns"sv, TrLater("an Apple icon")}},
     {"DDS",  {0, "DDS "sv, "DDS"}},
@@ -114,13 +113,10 @@ constexpr SignatureOfRow kWithoutCodec[] = {
     {"PPM",  {0, "P6\n"sv, "PPM"}},
     {"PAM",  {0, "P7\n"sv, "PAM"}},
     {"JXL",  {0, "\xff\x0a"sv, "JPEG XL"}},
-    {"PIC",  {0, "BM"sv, {}, 6, "\0\0\0\0"sv}},
-    {"KQP",  {0, "BM"sv, {}, 6, "\0\0\0\0"sv}},
     {"EXE",  {0, "MZ"sv, TrLater("a program")}},
     {"SCR",  {0, "MZ"sv}},
     {"SGI",  {0, "\x01\xda"sv, "SGI"}},
     {"RGB",  {0, "\x01\xda"sv}},
-    {"PIC",  {0, "\x34\x12"sv, "Pictor"}},
 };
 // clang-format on
 

@@ -44,7 +44,7 @@ TEST(Signature, TellsTheRowsThatMeanSuchFiles) {
       {Hex("00 00 02 00 01 00"), {"CUR", "ICO"}},
       {Hex("00 00 00 00 12 AF"), {"FLC", "FLI"}},
       {Hex("49 49 2A 00 10 00 00 00 43 52 02 00"), {"CR2"}},  // for plug-ins alone, though they are TIFF files of a kind
-      {Hex("42 4D 36 10 0E 00 00 00 00 00 36 00"), {"BMP", "DIB", "RLE", "BGA", "PIC", "KQP"}},
+      {Hex("42 4D 36 10 0E 00 00 00 00 00 36 00"), {"BMP", "DIB", "RLE", "BGA"}},
   };
   for (const auto& row : rows) EXPECT_EQ(IdentifySignature(row.head).extensions, row.extensions);
 }

@@ -1,0 +1,14 @@
+#pragma once
+
+#include "picture/picture_record.h"
+#include "picture/read_request.h"
+
+namespace fotomill {
+
+// Files named PIC, which may be Pictor pictures or those of Pegasus, and KQP, which are the latter.
+// Statuses: FileOpenError (1), and those of PictorRead and JpegRead.
+Status PicInfo(PictureRecord& picture, const ReadRequest& request);
+Status PicRead(PictureRecord& picture, const ReadRequest& request);
+Status PicDetails(PictureRecord& picture);
+
+}  // namespace fotomill
