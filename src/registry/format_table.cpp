@@ -83,7 +83,7 @@ constexpr Place kPlaces[] = {
     {"ANI", "(ANI) Windows animated cursor", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES | FMT_LAYERED | FMT_SECONDARY | FMT_TRANSPARENT},
     {"CAL"},
     {"CALS"},
-    {"CAM", "(CAM) Casio Digital Camera", 1, 24, FMT_BITMAP | FMT_SECONDARY},
+    {"CAM"},
     {"EMF", "(EMF) Enhanced Metafile", 1, 24, FMT_RENDERED | FMT_SECONDARY},
     {"EPS", "(EPS) EPS Preview", 0, 24, FMT_SECONDARY},
     {"FIF", "(FIF) Fractal Image", 1, 24, FMT_BITMAP | FMT_SECONDARY, true},

@@ -72,7 +72,6 @@ constexpr SignatureOfRow kWithoutCodec[] = {
     {"FLI",  {4, "\x12\xaf"sv}},
     {"MSP",  {0, "DanM"sv, "Microsoft Paint"}},
     {"MSP",  {0, "LinS"sv, "Microsoft Paint"}},
-    {"CAM",  {0, "\x07\x20MM"sv, "Casio CAM"}},
     {"FIF",  {0, "FIF\1"sv, "FIF"}},
     {"",     {0, "\x1a\x45\xdf\xa3"sv, TrLater("WebM or Matroska")}},
     {"WMV",  {0, "\x30\x26\xb2\x75\x8e\x66\xcf\x11"sv, "WMV"}},
