@@ -89,7 +89,7 @@ constexpr Place kPlaces[] = {
     {"FIF", "(FIF) Fractal Image", 1, 24, FMT_BITMAP | FMT_SECONDARY, true},
     {"FLI", "(FLI) FLIC animation", 1, 8, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES | FMT_SECONDARY},
     {"FLC", "(FLC) FLIC animation", 1, 8, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES | FMT_SECONDARY},
-    {"FPX", "(FPX) FlashPix", 1, 24, FMT_BITMAP | FMT_SECONDARY},
+    {"FPX"},
     {"FTS"},
     {"CUR"},
     {"HAM"},
