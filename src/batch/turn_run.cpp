@@ -48,6 +48,7 @@ class TurnBatch {
  private:
   std::string Planned(const BatchFile& file) const {
     if (function_.inPlace) return file.name;
+    if (!function_.out.empty()) return function_.out;
     const std::string folder = function_.keepTree && !file.below.empty()
                                    ? platform::JoinFolder(job_.destinationFolder, file.below)
                                    : job_.destinationFolder;

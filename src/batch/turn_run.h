@@ -16,6 +16,7 @@ struct TurnFunction {
   // each file is replaced; otherwise it is written to the job's destination folder under its own
   // name
   bool inPlace = false;
+  std::string out = {};   // not empty: the whole path of the output of a selection of one
   bool keepTree = false;  // the folders of the selection are recreated there
   uint32_t jobs = 0;      // number of parallel jobs; 0: one per core
   // Called on any thread before a file is replaced in place; false: it is left alone, because no

@@ -4,9 +4,10 @@
 
 #include "core/data_folder.h"
 #include "core/limits.h"
-#include "texts/name_hint.h"
 #include "platform/files.h"
 #include "platform/paths.h"
+#include "texts/name_hint.h"
+#include "texts/system_reason.h"
 
 namespace fotomill {
 
@@ -67,7 +68,7 @@ std::string ReadFile(const std::string& path, std::string& text) {
     case platform::ReadResult::TooLarge: return "\"" + path + "\" is longer than a megabyte.";
     case platform::ReadResult::Failed: break;
   }
-  return "\"" + path + "\" cannot be read.";
+  return WithReason("\"" + path + "\" cannot be read.");
 }
 
 }  // namespace

@@ -18,6 +18,8 @@ std::vector<std::string> ProgramFor(const std::string& file);
 // messages. Before anything is opened.
 void FillStandardStreams();
 bool IsTerminal(int stream);  // 0 standard input, 1 output, 2 error
+// Whether nobody reads what is written to a stream any more: a pipe whose other end is closed.
+bool IsReaderGone(int stream);
 bool IsStored(int stream);    // goes to a regular file: nobody waits for what is written
 // Waits until the standard input has something to read, or has ended. False when the program was
 // asked to end meanwhile.

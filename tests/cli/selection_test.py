@@ -42,7 +42,7 @@ def left_out():
             if line is not None:
                 check([text for text in err if "left out" in text], [line] if line else [], f"{arguments}, its line")
             check(err[-1].endswith("processed."), True, f"{arguments}, the count line")
-        place.files("one/x.mov")
+        place.files("one/x.mov", contents=b"?")
         check(place.run("verify", "one"), (0, "", "One other file was left out: 1 .mov\nNo files were processed.\n"), "a movie")
         check(place.run("verify", "one", "--quiet"), (0, "", ""), "a movie, quiet")
         check(place.run("verify", "one/x.mov")[0], 1, "a movie by its name")

@@ -15,14 +15,18 @@
 #include "cli/frame/terminal_box.h"
 #include "cli/frame/terminal_prompts.h"
 #include "cli/selection/file_selection.h"
+#include "cli/selection/output_place.h"
 #include "core/plain_name.h"
+#include "core/text.h"
 #include "platform/existence.h"
 #include "platform/files.h"
 #include "platform/paths.h"
+#include "platform/process.h"
 #include "processing/color/color_profile.h"
 #include "registry/registry.h"
 #include "settings/settings.h"
 #include "texts/status_text.h"
+#include "texts/system_reason.h"
 #include "texts/texts.h"
 
 namespace fotomill::cli {
@@ -96,7 +100,7 @@ std::string ReadProfile(const ConvertOptions& options, const BatchJob& job,
   std::string bytes;
   const auto read = platform::ReadWholeFile(options.profile, kMostProfileBytes, bytes);
   if (read != platform::ReadResult::Done)
-    return Tr("The color profile \"%1\" cannot be read.", options.profile);
+    return WithReason(Tr("The color profile \"%1\" cannot be read.", options.profile));
   request.use = ProfileRequest::Use::Given;
   request.profile = std::make_shared<const std::vector<uint8_t>>(bytes.begin(), bytes.end());
   if (ColorsOfProfile(*request.profile) != ProfileColors::Rgb)
@@ -109,7 +113,7 @@ std::string ReadProfile(const ConvertOptions& options, const BatchJob& job,
 // Reads the format that is asked for into `job`; none where every file keeps its own. What is
 // wrong, or empty.
 std::string ReadFormat(const ConvertOptions& options, bool mayKeep, BatchJob& job) {
-  if (options.to.empty() && options.out.empty())
+  if (options.to.empty() && (options.out.empty() || options.out == kStream))
     return mayKeep ? std::string() : Tr("Name the output format with --to.");
   const std::string extension =
       options.to.empty() ? std::string(platform::ExtensionOf(options.out)) : options.to;
@@ -175,7 +179,39 @@ std::string TakeRecipe(const ConvertOptions& options, const std::shared_ptr<cons
   return {};
 }
 
-int RunConvert(const ConvertOptions& options, const CommandContext& context) {
+// Where the picture comes from and goes to, as far as they are standard streams. What is wrong, or
+// empty.
+std::string TakeStreams(ConvertOptions& options, const CommandContext& context) {
+  TakeFolder(options.out, options.dest);
+  if (NamesInput(context)) {
+    if (!options.dest.empty()) return Tr("Standard input needs --out FILE.");
+    if (options.out.empty()) options.out = kStream;
+  }
+  return options.out == kStream && context.io.outTerminal
+             ? Tr("Standard output is a terminal; redirect it, or name a file with --out.")
+             : std::string();
+}
+
+// Runs the batch, whose output goes to standard output if `stream` has a file.
+int RunInto(const StreamedOutput& stream, const Selection& selection, const BatchFunction& function,
+            BatchJob& job, ResultOutput& output, const CommandContext& context) {
+  const Status status = RunBatch(selection.files, function, job);
+  if (status != Status::Ok) {
+    output.Message(output.ShownMessage(job.destinationFolder) + ": " + StatusText(status));
+    return kExitFailed;
+  }
+  if (selection.input) job.uses.clear();  // a file that is gone
+  const bool written = !job.errors && job.writeAborts == 0 && platform::PendingExit() == 0;
+  if (!stream.Path().empty() && written && !function.dryRun && !stream.Deliver(context)) {
+    output.Message(std::string(kStream) + ": " + StatusText(Status::FileReadError));
+    return kExitFailed;
+  }
+  return FinishBatch(job, context);
+}
+
+int RunConvert(ConvertOptions options, const CommandContext& context) {
+  if (const std::string wrong = TakeStreams(options, context); !wrong.empty())
+    return UsageError(context, wrong);
   BatchJob job = NewBatchJob();
   job.remember = nullptr;
   std::shared_ptr<const Recipe> recipe;
@@ -194,19 +230,29 @@ int RunConvert(const ConvertOptions& options, const CommandContext& context) {
     return UsageError(context, Tr("--out takes exactly one picture."));
   if (options.quality > 0) job.encode.jpegQuality = job.encode.webpQuality = options.quality;
 
-  ResultOutput output(context, options.json);
+  const bool streams = options.out == kStream;
+  const CommandContext shown = streams ? WithResultsOnError(context) : context;
+  ResultOutput output(shown, options.json);
   output.CloseWith(selection->leftOut);
-  TerminalPrompts prompts(context, output);
+  if (selection->input) output.ShowAsStream(selection->input->Path());
+  TerminalPrompts prompts(shown, output);
   job.destinationFolder = options.dest;
   job.prompts = context.MayAsk() ? &prompts : nullptr;
   SetOverwritePolicy(options, context, job);
-  TerminalBox box(output, options.verbose, options.overwrite.empty() && !job.overwrite.prompt);
+  TerminalBox box(output, options.verbose,
+                  !streams && options.overwrite.empty() && !job.overwrite.prompt);
   job.box = &box;
-  if (const Status status = RunBatch(selection->files, function, job); status != Status::Ok) {
-    output.Message(output.ShownMessage(options.dest) + ": " + StatusText(status));
-    return kExitFailed;
+  StreamedOutput stream;
+  if (streams) {
+    const std::string_view source = platform::ExtensionOf(selection->files.front().name);
+    if (!stream.Create(LowerCase(job.extension.empty() ? source : job.extension))) {
+      output.Message("fotomill: " + WithReason(Tr("No temporary file can be created.")));
+      return kExitFailed;
+    }
+    output.ShowAsStream(stream.Path());
+    function.out = stream.Path();
   }
-  return FinishBatch(job, context);
+  return RunInto(stream, *selection, function, job, output, context);
 }
 
 }  // namespace
@@ -214,12 +260,14 @@ int RunConvert(const ConvertOptions& options, const CommandContext& context) {
 namespace {
 
 void SetUp(CLI::App& app, CommandContext& context, const std::shared_ptr<ConvertOptions>& options) {
+  options->selection.takesInput = true;
   AddSelection(app, options->selection, context);
   AddName(app, "-t,--to", options->to, "EXT", "Output format, by extension");
   CLI::Option* dest = AddName(app, "-d,--dest", options->dest, "DIR",
                               "Output folder, created if needed (default: beside each source)");
   CLI::Option* out =
-      AddName(app, "-o,--out", options->out, "FILE", "Output file, for a single picture");
+      AddName(app, "-o,--out", options->out, "FILE|-",
+              "Output file, for a single picture; FOLDER/ is --dest FOLDER, - is standard output");
   Exclude(out, dest);
   Exclude(AddRepeatedText(app, "--prefix", options->prefix, "TEXT", "Prefix for output names"),
           out);

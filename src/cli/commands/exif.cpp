@@ -105,6 +105,7 @@ class ExifRun {
 
   void ReportFiles(const Selection& selection) {
     output_.CloseWith(selection.leftOut);
+    if (selection.input) output_.ShowAsStream(selection.input->Path());
     const std::vector<SelectedFile>& files = selection.files;
     for (const SelectedFile& file : files) {
       if (!output_.GoesOn()) return;
@@ -144,7 +145,7 @@ class ExifRun {
     JsonLines lines;
     Json element;
     const Outcome outcome = WalkFile(file, options_, lines);
-    PutName(element, "file", file.name);
+    PutName(element, "file", output_.NameOf(file.name));
     PutStatus(element, outcome.status);
     element["directories"] = lines.Take();
     output_.Element(element);
@@ -221,6 +222,7 @@ int RunExif(const ExifOptions& options, const CommandContext& context) {
 
 void SetUpExif(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<ExifOptions>();
+  options->selection.takesInput = true;
   AddSelection(app, options->selection, context);
   AddFlag(app, "--json", options->json, "Print a JSON array with one object per file");
   AddName(app, "--thumbnail", options->thumbnail, "OUT",

@@ -14,6 +14,7 @@
 #include "settings/job_options.h"
 #include "settings/settings.h"
 #include "texts/name_hint.h"
+#include "texts/system_reason.h"
 #include "texts/texts.h"
 
 namespace fotomill::cli {
@@ -36,7 +37,8 @@ constexpr const char* kOff = TrLater("The file history is disabled.");
 int Complain(const CommandContext& context, const char* message) {
   ResultOutput output(context, false);
   const std::string path = FileHistoryPath(HistoryOptionsFromSettings());
-  output.Note((path.empty() ? "fotomill" : output.ShownMessage(path)) + ": " + Tr(message));
+  output.Note((path.empty() ? "fotomill" : output.ShownMessage(path)) + ": " +
+              WithReason(Tr(message)));
   return kExitFailed;
 }
 

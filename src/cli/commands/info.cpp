@@ -114,7 +114,7 @@ void ReportFile(const SelectedFile& file, ResultOutput& output) {
       status == Status::Ok || !file.hint.empty() ? file.hint : OpenHint(file.name, status);
   if (output.IsJson()) {
     Json element;
-    PutName(element, "file", file.name);
+    PutName(element, "file", output.NameOf(file.name));
     PutStatus(element, status);
     if (status == Status::Ok) element.update(FactsAsJson(*picture));
     if (status == Status::Ok ? OpenedByContents(*picture) : file.status == Status::Ok) {
@@ -136,6 +136,7 @@ int RunInfo(const InfoOptions& options, const CommandContext& context) {
   if (!selection) return kExitUsage;
   ResultOutput output(context, options.json);
   output.CloseWith(selection->leftOut);
+  if (selection->input) output.ShowAsStream(selection->input->Path());
   for (const SelectedFile& file : selection->files) {
     if (!output.GoesOn()) break;
     ReportFile(file, output);
@@ -147,6 +148,7 @@ int RunInfo(const InfoOptions& options, const CommandContext& context) {
 
 void SetUpInfo(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<InfoOptions>();
+  options->selection.takesInput = true;
   AddSelection(app, options->selection, context);
   AddFlag(app, "--json", options->json, "Print a JSON array with one object per file");
   SetFooter(app, nullptr, "fotomill info holiday --recursive --json");

@@ -48,7 +48,11 @@ bool OpenDatabase(ThumbnailDatabase& database, const std::string& path, bool cre
     case ThumbnailDatabase::Opened::Done: return true;
     case ThumbnailDatabase::Opened::Missing: output.Failure(path, Status::FileOpenError); break;
     case ThumbnailDatabase::Opened::NotRead:
-      output.Failure(path, Status::DamagedFile, Tr(kNoDatabase));
+      if (const std::string reason = ReasonSentence(); !reason.empty()) {
+        output.Failure(path, Status::FileOpenError, reason);
+      } else {
+        output.Failure(path, Status::DamagedFile, Tr(kNoDatabase));
+      }
       break;
     case ThumbnailDatabase::Opened::Failed:
       output.Failure(path, Status::ErrorCreatingFile, ReasonSentence());
@@ -155,6 +159,7 @@ int RunAdd(const TdbOptions& options, CommandContext& context) {
   if (!selection) return kExitUsage;
   ResultOutput output(context, false);
   output.CloseWith(selection->leftOut);
+  output.KeepGoing();
   if (options.dryRun) {
     for (const SelectedFile& file : selection->files) {
       if (file.status != Status::Ok) {

@@ -135,6 +135,7 @@ int RunMake(const ThumbsOptions& options, const CommandContext& context) {
   const ThumbnailOptions thumbnails = ThumbnailOptionsFromSettings();
   ResultOutput output(context, options.json);
   output.CloseWith(selection->leftOut);
+  output.KeepGoing();
   UsedFiles used(FileFunction::Catalog, !options.dryRun && !context.global.noHistory);
   std::atomic<bool> goesOn = true;
   OrderedRun run({
@@ -196,8 +197,11 @@ int RunShow(const ThumbsOptions& options, const CommandContext& context) {
   };
   if (!platform::IsRegularFile(name)) return fail(name, Status::FileOpenError, {});
   ThumbnailRecord record;
-  if (!ReadThumbnailFile(record, name))
-    return fail(name, Status::DamagedFile, Tr("Not a thumbnail file."));
+  if (!ReadThumbnailFile(record, name)) {
+    const std::string reason = ReasonSentence();
+    return reason.empty() ? fail(name, Status::DamagedFile, Tr("Not a thumbnail file."))
+                          : fail(name, Status::FileOpenError, reason);
+  }
   const PicturePointer picture = NewPictureRecord(ReadOptionsFromSettings().alphaBackground);
   if (picture == nullptr) return fail(name, Status::MemoryAllocationError, {});
   if (const Status status = ThumbnailRecordToBitmap(record, picture->image); status != Status::Ok)

@@ -10,8 +10,10 @@
 #include "cli/frame/result_output.h"
 #include "cli/frame/terminal_box.h"
 #include "cli/selection/file_selection.h"
+#include "cli/selection/output_place.h"
 #include "platform/existence.h"
 #include "platform/files.h"
+#include "registry/registry.h"
 #include "settings/settings.h"
 #include "texts/texts.h"
 
@@ -22,7 +24,7 @@ namespace {
 struct TurnOptions {
   SelectionOptions selection;
   std::string rotate, flip;
-  std::string dest;
+  std::string dest, out;
   std::string overwrite = "keep-both";
   int32_t jobs = 0;
   bool byExif = false;
@@ -55,7 +57,8 @@ std::string CheckOptions(const TurnOptions& options) {
   if (options.rotate.empty() && options.flip.empty() && !options.byExif) {
     return Tr("Choose --rotate, --flip or --by-exif.");
   }
-  if (!options.inPlace && options.dest.empty()) return Tr("Choose --dest DIR or --in-place.");
+  if (!options.inPlace && options.dest.empty() && options.out.empty())
+    return Tr("Choose --dest DIR, --out FILE or --in-place.");
   if (options.keepTree && options.dest.empty()) return Tr("--keep-tree needs --dest.");
   if (!options.dest.empty() && platform::ExistenceOf(options.dest) == platform::Existence::Yes &&
       !platform::IsFolder(options.dest)) {
@@ -64,11 +67,24 @@ std::string CheckOptions(const TurnOptions& options) {
   return {};
 }
 
-int RunTurnCommand(const TurnOptions& options, const CommandContext& context) {
+// What is wrong with --out for these files; empty if nothing is.
+std::string CheckOut(const std::string& out, const std::vector<SelectedFile>& files) {
+  if (out.empty()) return {};
+  if (files.size() != 1) return Tr("--out takes exactly one picture.");
+  const bool sameFormat = FindFormatByName(out) == FindFormatByName(files.front().name);
+  return sameFormat
+             ? std::string()
+             : Tr("\"%1\" must have the extension of its source: turn keeps the format.", out);
+}
+
+int RunTurnCommand(TurnOptions options, const CommandContext& context) {
+  TakeFolder(options.out, options.dest);
   if (const std::string wrong = CheckOptions(options); !wrong.empty())
     return UsageError(context, wrong);
   const auto selection = SelectFiles(options.selection, context);
   if (!selection) return kExitUsage;
+  if (const std::string wrong = CheckOut(options.out, selection->files); !wrong.empty())
+    return UsageError(context, wrong);
   TurnFunction function{
       .request = {.turn = Composed(TurnNamed(options.rotate), TurnNamed(options.flip)),
                   .seenByExif = options.byExif || settings.ExifAdjustOrientation != 0,
@@ -76,6 +92,7 @@ int RunTurnCommand(const TurnOptions& options, const CommandContext& context) {
                   .keepTime = options.keepTimes,
                   .dryRun = options.dryRun},
       .inPlace = options.inPlace,
+      .out = options.out,
       .keepTree = options.keepTree,
       .jobs = static_cast<uint32_t>(options.jobs)};
   BatchJob job = NewBatchJob();
@@ -103,7 +120,12 @@ void SetUpTurn(CLI::App& app, CommandContext& context) {
           "Rotate upright by EXIF orientation, before --rotate and --flip");
   CLI::Option* dest =
       AddName(app, "-d,--dest", options->dest, "DIR", "Output folder, created if needed");
-  Exclude(AddFlag(app, "--in-place", options->inPlace, "Replace each file"), dest);
+  CLI::Option* out = AddName(app, "-o,--out", options->out, "FILE",
+                             "Output file, for a single picture; FOLDER/ is --dest FOLDER");
+  CLI::Option* inPlace = AddFlag(app, "--in-place", options->inPlace, "Replace each file");
+  Exclude(inPlace, dest);
+  Exclude(inPlace, out);
+  Exclude(out, dest);
   AddChoice(app, "--overwrite", options->overwrite, "HOW",
             "If the output exists in --dest: keep-both (default), replace or skip", {"keep-both", "replace", "skip"});
   AddFlag(app, "--trim", options->trim, "Crop JPEG edges that cannot be turned losslessly");

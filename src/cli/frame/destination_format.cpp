@@ -46,6 +46,15 @@ std::string UnknownFormat(const std::string& extension) {
 
 }  // namespace
 
+std::string ReadSourceFormat(const std::string& name, std::string& extension) {
+  const int32_t index = RowOfExtension(name);
+  if (index == kNoFormat) return UnknownFormat(name);
+  const FormatEntry& row = FormatRow(index);
+  extension = LowerCase(row.extension.view());
+  return CanRead(row) ? std::string()
+                      : Tr("%1 cannot be read.", row.extension.view()) + " " + Tr(WhyNot(row));
+}
+
 std::string ReadDestinationFormat(const std::string& extension, BatchJob& job) {
   job.formatIndex = RowOfExtension(extension);
   if (job.formatIndex == kNoFormat) return UnknownFormat(extension);

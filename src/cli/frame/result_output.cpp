@@ -1,5 +1,6 @@
 #include "cli/frame/result_output.h"
 
+#include <algorithm>
 #include <utility>
 
 #include "batch/progress_model.h"
@@ -65,11 +66,17 @@ ResultOutput::ResultOutput(const CommandContext& context, bool json)
 
 ResultOutput::~ResultOutput() { EndArray(); }
 
+std::string_view ResultOutput::NameOf(std::string_view name) const {
+  return std::ranges::find(streams_, name) != streams_.end() ? "-" : name;
+}
+
 std::string ResultOutput::Shown(std::string_view name) const {
+  name = NameOf(name);
   return context_.io.outTerminal ? EscapeControls(name) : std::string(name);
 }
 
 std::string ResultOutput::ShownMessage(std::string_view name) const {
+  name = NameOf(name);
   return context_.io.errTerminal ? EscapeControls(name) : std::string(name);
 }
 
@@ -124,13 +131,20 @@ void ResultOutput::Note(std::string_view text) {
 }
 
 bool ResultOutput::GoesOn() const {
-  return std::ferror(context_.io.out) == 0 && platform::PendingExit() == 0;
+  if (platform::PendingExit() != 0) return false;
+  return std::ferror(context_.io.out) == 0 || (keepsGoing_ && ReaderGone());
+}
+
+bool ResultOutput::ReaderGone() const {
+  return (context_.io.out == stdout && platform::IsReaderGone(1)) ||
+         (context_.io.out == stderr && platform::IsReaderGone(2));
 }
 
 int ResultOutput::Finish() {
   progress_.Clear();
   EndArray();
-  if (!context_.global.quiet) {
+  const bool givenUp = !keepsGoing_ && std::ferror(context_.io.out) != 0 && ReaderGone();
+  if (!context_.global.quiet && !givenUp) {
     if (failures_ > 0) Message(Tr(kErrorsLine));
     Message(CountLine(static_cast<uint32_t>(files_)));
   }

@@ -5,6 +5,7 @@
 #include <nlohmann/json.hpp>
 #include <string>
 #include <string_view>
+#include <vector>
 
 #include "cli/frame/command.h"
 #include "cli/frame/terminal_progress.h"
@@ -38,6 +39,13 @@ class ResultOutput {
   std::string Shown(std::string_view name) const;
   // The same for messages.
   std::string ShownMessage(std::string_view name) const;
+
+  // From here on results and messages call the file at `path` "-": it stands for a standard stream.
+  void ShowAsStream(const std::string& path) { streams_.push_back(path); }
+  // The name of a file in results.
+  std::string_view NameOf(std::string_view name) const;
+  // The command changes files: it finishes its work although nobody reads the results any more.
+  void KeepGoing() { keepsGoing_ = true; }
 
   // One result line, without line end, already escaped. Not for JSON.
   void Line(std::string_view line);
@@ -76,9 +84,12 @@ class ResultOutput {
  private:
   void ClearForResult();
   void Deliver(bool now);
+  bool ReaderGone() const;
 
   const CommandContext& context_;
   const bool json_;
+  bool keepsGoing_ = false;
+  std::vector<std::string> streams_;
   bool colored_;
   bool begun_ = false;  // the array has an element
   bool ended_ = false;

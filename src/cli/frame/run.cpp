@@ -193,7 +193,8 @@ int RunCommandLine(int count, const char* const* arguments, const Io& io) {
   } catch (const std::exception& error) {
     Print(io.err, std::string("fotomill: ") + error.what() + "\n");
   }
-  if (std::fflush(io.out) != 0 || std::ferror(io.out) != 0) {
+  const bool failed = std::fflush(io.out) != 0 || std::ferror(io.out) != 0;
+  if (failed && !(io.out == stdout && platform::IsReaderGone(1))) {
     Print(io.err, std::string("fotomill: ") + Tr("The results could not be written.") + "\n");
     if (status == kExitOk) status = kExitFailed;
   }

@@ -27,9 +27,9 @@ void TerminalBox::ShowLine(const ProgressLine& line, const FileOutcome* outcome)
 
 void TerminalBox::ShowElement(const FileOutcome& outcome) {
   Json element;
-  PutName(element, "file", outcome.source);
+  PutName(element, "file", output_.NameOf(outcome.source));
   PutName(element, "destination",
-          outcome.status == Status::Ok ? outcome.destination : std::string());
+          outcome.status == Status::Ok ? output_.NameOf(outcome.destination) : std::string_view());
   if (!outcome.output.empty()) element["output"] = outcome.output;
   PutStatus(element, outcome.status);
   if (outcome.skipped) element["skipped"] = true;

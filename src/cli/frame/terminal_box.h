@@ -11,7 +11,9 @@ class TerminalBox : public ProgressBox {
   // `verbose` also prints notes that are not failures, `tellReplaced` also which files were
   // replaced.
   TerminalBox(ResultOutput& output, bool verbose, bool tellReplaced)
-      : output_(output), verbose_(verbose), tellReplaced_(tellReplaced) {}
+      : output_(output), verbose_(verbose), tellReplaced_(tellReplaced) {
+    output_.KeepGoing();
+  }
 
   bool Open(const ProgressModel&) override { return true; }
   void ShowLine(const ProgressLine& line, const FileOutcome* outcome) override;

@@ -4,12 +4,16 @@
 #include <set>
 #include <utility>
 
+#include "cli/frame/destination_format.h"
+#include "cli/frame/options.h"
 #include "cli/selection/file_order.h"
 #include "cli/selection/left_out_files.h"
-#include "cli/frame/options.h"
+#include "cli/selection/standard_input.h"
 #include "core/limits.h"
 #include "core/natural_order.h"
 #include "platform/files.h"
+#include "platform/folders.h"
+#include "platform/input.h"
 #include "platform/paths.h"
 #include "registry/registry.h"
 #include "texts/system_reason.h"
@@ -21,24 +25,40 @@ namespace {
 
 constexpr int kDeepestFolder = 64;
 
-// Reads a whole stream, up to the limit of list files; false if it is longer or cannot be read.
-bool ReadStream(std::FILE* stream, std::string& contents) {
-  char buffer[16384];
-  while (const size_t count = std::fread(buffer, 1, sizeof buffer, stream)) {
-    contents.append(buffer, count);
+// Reads a list from standard input; false if it is too long or cannot be read.
+bool ReadInputList(const Io& io, std::string& contents) {
+  uint8_t buffer[16384];
+  for (;;) {
+    const auto count = ReadInput(io, buffer);
+    if (!count) return false;
+    if (*count == 0) return true;
+    contents.append(reinterpret_cast<const char*>(buffer), *count);
     if (contents.size() > limits.listFileBytes) return false;
   }
-  return std::ferror(stream) == 0;
 }
 
 std::vector<std::string> SplitList(std::string_view list, char end) {
   std::vector<std::string> names;
   while (!list.empty()) {
     const size_t place = list.find(end);
-    if (place != 0) names.emplace_back(list.substr(0, place));
+    std::string_view name = list.substr(0, place);
+    if (end == '\n' && name.ends_with('\r')) name.remove_suffix(1);
+    if (!name.empty()) names.emplace_back(name);
     list.remove_prefix(place == std::string_view::npos ? list.size() : place + 1);
   }
   return names;
+}
+
+// The path of a folder from the current one on; of others from the root on. Nothing leads up.
+std::string FolderFromHere(const std::string& folder) {
+  const std::string path = platform::AbsolutePath(folder.empty() ? "." : folder);
+  std::string_view rest = path;
+  const std::string here = platform::JoinFolder(platform::CurrentFolder(), "");
+  if (platform::JoinFolder(path, "") == here) return {};
+  if (rest.starts_with(here)) return std::string(rest.substr(here.size()));
+  rest.remove_prefix(platform::SplitPath(rest).drive.size());
+  while (rest.starts_with(platform::kSeparator)) rest.remove_prefix(1);
+  return std::string(rest);
 }
 
 class Selector {
@@ -46,24 +66,45 @@ class Selector {
   explicit Selector(const SelectionOptions& options) : options_(options) {}
 
   void Add(const std::string& name) {
-    const platform::FileFacts facts = platform::FactsOf(name);
-    if (facts.kind == platform::FileKind::Folder) {
-      trail_.clear();
-      trail_.insert({facts.device, facts.identity});
-      AddFolder(name, {}, 0);
-    } else if (facts.kind == platform::FileKind::Missing) {
-      files_.push_back({name, {}, Status::FileOpenError, Tr("The file does not exist.")});
+    if (platform::IsFolder(name)) {
+      AddTree(name, {});
     } else {
-      files_.push_back({name, {}, Status::Ok, {}});
+      AddNamed(name, {});
     }
+  }
+  // From a list: outputs that keep the tree have the folders from the current one on.
+  void AddListed(const std::string& name) {
+    if (platform::IsFolder(name)) {
+      AddTree(name, FolderFromHere(name));
+    } else {
+      AddNamed(name, FolderFromHere(platform::FolderOf(name)));
+    }
+  }
+  void AddInput(const Io& io) {
+    input_ = std::make_shared<StandardInput>();
+    files_.push_back(input_->Take(io, options_.from));
   }
   Selection Take() {
     SortFiles(options_.sort, files_);
     if (options_.reverse) std::ranges::reverse(files_);
-    return {std::move(files_), leftOut_.Line()};
+    return {std::move(files_), leftOut_.Line(), std::move(input_)};
   }
 
  private:
+  void AddNamed(const std::string& name, const std::string& below) {
+    if (platform::FactsOf(name).kind == platform::FileKind::Missing) {
+      files_.push_back({name, below, Status::FileOpenError, Tr("The file does not exist.")});
+    } else {
+      files_.push_back({name, below, Status::Ok, {}});
+    }
+  }
+
+  void AddTree(const std::string& folder, const std::string& below) {
+    const platform::FileFacts facts = platform::FactsOf(folder);
+    trail_ = {{facts.device, facts.identity}};
+    AddFolder(folder, below, 0);
+  }
+
   void AddFolder(const std::string& folder, const std::string& below, int depth) {
     auto entries = platform::ListFolder(folder);
     if (!entries) {
@@ -122,7 +163,34 @@ class Selector {
   std::set<std::pair<uint64_t, uint64_t>> trail_;  // the folder that is being read and its parents
   std::vector<SelectedFile> files_;
   LeftOutFiles leftOut_;
+  std::shared_ptr<StandardInput> input_;
 };
+
+// What is wrong with the use of standard input, a sentence; empty if nothing is.
+std::string CheckInput(SelectionOptions& options, const CommandContext& context) {
+  const auto named =
+      options.takesInput ? std::ranges::count(context.names.values, std::string(kStream)) : 0;
+  if (named == 0)
+    return options.from.empty() ? std::string() : Tr("--from is for standard input, named \"-\".");
+  if (named > 1 || options.filesFrom == kStream) return Tr("Standard input can be read only once.");
+  if (context.io.inTerminal) return Tr("Standard input is a terminal; pipe a picture into it.");
+  return options.from.empty() ? std::string() : ReadSourceFormat(options.from, options.from);
+}
+
+// Reads the list of --files-from. What is wrong, or empty.
+std::string ReadList(const SelectionOptions& options, const CommandContext& context,
+                     std::string& list) {
+  if (options.filesFrom.empty()) return {};
+  if (options.filesFrom == kStream) {
+    return ReadInputList(context.io, list)
+               ? std::string()
+               : Tr("The list of names on standard input cannot be read.");
+  }
+  const auto result = platform::ReadListFile(options.filesFrom, limits.listFileBytes, list);
+  return result == platform::ReadResult::Done
+             ? std::string()
+             : WithReason(Tr("The list of names \"%1\" cannot be read.", options.filesFrom));
+}
 
 }  // namespace
 
@@ -136,32 +204,39 @@ void AddSelection(CLI::App& app, SelectionOptions& options, CommandContext& cont
   AddFlag(app, "--reverse", options.reverse, "Reverse that order");
   AddName(app, "--files-from", options.filesFrom, "FILE|-",
           "Read names from a file, one per line; - is standard input");
+  if (options.takesInput) {
+    AddName(app, "--from", options.from, "EXT",
+            "Format of standard input, \"-\", if its contents do not tell");
+  }
   AddFlag(app, "-0,--null", options.zeroTerminated,
           "Names in that file are separated by NUL (find -print0)");
 }
 
-std::optional<Selection> SelectFiles(const SelectionOptions& options,
-                                     const CommandContext& context) {
-  Selector selector(options);
+bool NamesInput(const CommandContext& context) {
+  return std::ranges::find(context.names.values, kStream) != context.names.values.end();
+}
+
+std::optional<Selection> SelectFiles(const SelectionOptions& given, const CommandContext& context) {
+  SelectionOptions options = given;
   std::string list;
-  if (options.filesFrom == "-") {
-    if (!ReadStream(context.io.in, list)) {
-      UsageError(context, Tr("The list of names on standard input cannot be read."));
-      return std::nullopt;
-    }
-  } else if (!options.filesFrom.empty()) {
-    if (platform::ReadWholeFile(options.filesFrom, limits.listFileBytes, list) !=
-        platform::ReadResult::Done) {
-      UsageError(context, Tr("The list of names \"%1\" cannot be read.", options.filesFrom));
-      return std::nullopt;
-    }
-  } else if (context.names.values.empty()) {
-    UsageError(context, Tr("No files given."));
+  std::string wrong = CheckInput(options, context);
+  if (wrong.empty()) wrong = ReadList(options, context, list);
+  if (wrong.empty() && options.filesFrom.empty() && context.names.values.empty())
+    wrong = Tr("No files given.");
+  if (!wrong.empty()) {
+    UsageError(context, wrong);
     return std::nullopt;
   }
-  for (const std::string& name : context.names.values) selector.Add(name);
+  Selector selector(options);
+  for (const std::string& name : context.names.values) {
+    if (options.takesInput && name == kStream) {
+      selector.AddInput(context.io);
+    } else {
+      selector.Add(name);
+    }
+  }
   for (const std::string& name : SplitList(list, options.zeroTerminated ? '\0' : '\n'))
-    selector.Add(name);
+    selector.AddListed(name);
   return selector.Take();
 }
 

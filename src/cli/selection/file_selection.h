@@ -1,11 +1,13 @@
 #pragma once
 
+#include <memory>
 #include <optional>
 #include <string>
 #include <vector>
 
 #include "batch/run.h"
 #include "cli/frame/command.h"
+#include "cli/selection/standard_input.h"
 
 namespace fotomill::cli {
 
@@ -21,15 +23,23 @@ struct SelectionOptions {
   bool zeroTerminated = false;
   std::string sort;  // empty: named files as named, folders in natural order
   bool reverse = false;
+  bool takesInput = false;  // "-" is standard input
+  std::string from;         // its format
 };
 
 // What a command line asks for.
 struct Selection {
   std::vector<SelectedFile> files;
   std::string leftOut;  // what was left out of folders, a sentence; empty if nothing was
+  // standard input, if it is one of the files
+  std::shared_ptr<StandardInput> input = {};
 };
 
-// Declares the FILE... names of a command and the options that choose files.
+// Whether a command line names standard input as a picture.
+bool NamesInput(const CommandContext& context);
+
+// Declares the FILE... names of a command and the options that choose files. `options.takesInput`
+// counts before.
 void AddSelection(CLI::App& app, SelectionOptions& options, CommandContext& context);
 
 // The files of a command line: files as named; for a folder, its files that this build can read, in

@@ -133,6 +133,13 @@ void FillStandardStreams() {
 
 bool IsTerminal(int stream) { return isatty(stream) == 1; }
 
+bool IsReaderGone(int stream) {
+  pollfd output = {stream, 0, 0};
+  struct stat facts;
+  return fstat(stream, &facts) == 0 && (S_ISFIFO(facts.st_mode) || S_ISSOCK(facts.st_mode)) &&
+         poll(&output, 1, 0) > 0 && (output.revents & (POLLERR | POLLHUP)) != 0;
+}
+
 bool IsStored(int stream) {
   struct stat facts;
   return fstat(stream, &facts) == 0 && S_ISREG(facts.st_mode);
