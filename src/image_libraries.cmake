@@ -1,11 +1,13 @@
-# The libraries that decode and encode pictures, as `image_libraries` and `image_include_folders`.
+# The libraries that decode and encode pictures and draw text, as `image_libraries` and `image_include_folders`.
 #
 # They are linked statically where the system has them so: loading them would cost every run, and most runs need none.
 # Which archives a static library needs in turn differs between releases; pkg-config knows. Where an archive is missing, or
 # the static set does not link, the shared libraries serve.
 find_package(PkgConfig REQUIRED)
-pkg_check_modules(IMAGES REQUIRED libtiff-4 libwebp libjpeg libpng lcms2 freetype2 libdeflate zlib)
-set(image_include_folders ${IMAGES_INCLUDE_DIRS})
+pkg_check_modules(IMAGES REQUIRED libtiff-4 libwebp libjpeg libpng lcms2 freetype2 fribidi libdeflate zlib)
+# Only headers: both are loaded when the first text is drawn.
+pkg_check_modules(TEXTS REQUIRED harfbuzz fontconfig)
+set(image_include_folders ${IMAGES_INCLUDE_DIRS} ${TEXTS_INCLUDE_DIRS})
 
 set(c_library_parts c m pthread dl rt stdc++ gcc_s)  # never from an archive in a program that loads the C library
 set(static_set "")
@@ -29,11 +31,12 @@ check_cxx_source_compiles([[
 extern "C" {
 char TIFFOpen(); char WebPDecode(); char WebPEncode(); char jpeg_start_decompress(); char jpeg_start_compress();
 char png_read_image(); char png_write_image(); char cmsCreateTransform(); char FT_Open_Face(); char inflate();
-char libdeflate_alloc_compressor();
+char libdeflate_alloc_compressor(); char fribidi_get_bidi_types();
 }
 int main() {
   return TIFFOpen() + WebPDecode() + WebPEncode() + jpeg_start_decompress() + jpeg_start_compress() + png_read_image() +
-         png_write_image() + cmsCreateTransform() + FT_Open_Face() + inflate() + libdeflate_alloc_compressor();
+         png_write_image() + cmsCreateTransform() + FT_Open_Face() + inflate() + libdeflate_alloc_compressor() +
+         fribidi_get_bidi_types();
 }]] STATIC_IMAGE_LIBRARIES_LINK)
 unset(CMAKE_REQUIRED_LIBRARIES)
 if(STATIC_IMAGE_LIBRARIES_LINK)

@@ -114,6 +114,10 @@ CHOICES(kLengthUnitChoices,
     CHOICE("Inches",      kInches),
     CHOICE("Centimeters", kCentimetres),
     CHOICE("Pixels",      kPixels));
+CHOICES(kBevelChoices,
+    CHOICE("Sunken", kBevelSunken),
+    CHOICE("Raised", kBevelRaised),
+    CHOICE("None",   kBevelNone));
 CHOICES(kSizeModeChoices,
     CHOICE("Bytes",             kSizeBytes),
     CHOICE("Kilobytes",         kSizeKilobytes),

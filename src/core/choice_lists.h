@@ -102,6 +102,8 @@ enum HistoryColumn : int32_t {
 enum DistanceUnit : int32_t { kMiles = 0, kKilometres = 1 };
 // InfoUnits, MattUnits, PrintWorkshopUnits.
 enum LengthUnit : int32_t { kInches = 0, kCentimetres = 1, kPixels = 2 };
+// MattBevelType: how a matte's inner edge is cut.
+enum MattBevel : int32_t { kBevelSunken = 0, kBevelRaised = 1, kBevelNone = 2 };
 // DetailSizeMode: how file sizes are shown.
 enum SizeMode : int32_t { kSizeBytes = 0, kSizeKilobytes = 1, kSizeFitting = 2 };
 // MDIClientBackground: MDIClientColor or MDIClientImage fills the frame.
@@ -119,7 +121,7 @@ struct ChoiceEntry {
 static_assert(sizeof(void*) != 4 || sizeof(ChoiceEntry) == 24);  // six words, as plug-ins see it
 
 // The list of each choice key in settings.def. The texts are what Setup dialogs show, in English.
-extern const ChoiceEntry kDateModeChoices[], kDistanceUnitChoices[], kDitherChoices[],
+extern const ChoiceEntry kBevelChoices[], kDateModeChoices[], kDistanceUnitChoices[], kDitherChoices[],
     kDropChoices[], kExtensionCaseChoices[], kFrameBackgroundChoices[], kHistoryLimitChoices[],
     kHistorySortChoices[], kHistoryThumbnailChoices[], kIconCompressionChoices[],
     kJpegProcessorChoices[], kJpegSubsampleChoices[], kLengthUnitChoices[], kMonoDitherChoices[],

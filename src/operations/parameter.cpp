@@ -24,7 +24,8 @@ constexpr UnitName kUnits[] = {{"px", LengthUnit::Pixels},
                                {"%", LengthUnit::Percent},
                                {"cm", LengthUnit::Centimeters},
                                {"mm", LengthUnit::Millimeters},
-                               {"in", LengthUnit::Inches}};
+                               {"in", LengthUnit::Inches},
+                               {"pt", LengthUnit::Points}};
 
 // Takes a decimal number off the start of `text`; no exponent, no infinity.
 std::optional<double> TakeDecimal(std::string_view& text) {
@@ -45,10 +46,10 @@ std::optional<double> WholeDecimal(std::string_view text) {
   return text.empty() ? number : std::nullopt;
 }
 
-bool TakeLength(std::string_view& text, Length& length) {
+bool TakeLength(std::string_view& text, Length& length, LengthUnit plain = LengthUnit::Pixels) {
   const auto number = TakeDecimal(text);
   if (!number) return false;
-  length = {*number, LengthUnit::Pixels};
+  length = {*number, plain};
   for (const UnitName& unit : kUnits) {
     if (!text.starts_with(unit.name)) continue;
     length.unit = unit.unit;
@@ -100,7 +101,9 @@ std::string CheckLength(const Parameter& row, const Length& length) {
 }
 
 std::string ReadLength(const Parameter& row, std::string_view text, Value& value) {
-  if (!TakeLength(text, value.x) || !text.empty()) return "must be a length such as 12, 5% or 2cm";
+  const bool points = std::string_view(row.unit) == "pt";
+  if (!TakeLength(text, value.x, points ? LengthUnit::Points : LengthUnit::Pixels) || !text.empty())
+    return "must be a length such as 12, 5% or 2cm";
   return CheckLength(row, value.x);
 }
 
@@ -239,6 +242,7 @@ double Length::Pixels(double whole, double dpi) const {
     case LengthUnit::Centimeters: return number * dpi / 2.54;
     case LengthUnit::Millimeters: return number * dpi / 25.4;
     case LengthUnit::Inches: return number * dpi;
+    case LengthUnit::Points: return number * dpi / 72;
     case LengthUnit::Pixels: break;
   }
   return number;

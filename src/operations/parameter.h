@@ -36,7 +36,7 @@ std::string_view KindName(ParameterKind kind);
 struct Parameter {
   const char* name;
   ParameterKind kind;
-  // "px", "levels", "%", "degrees"; what plain numbers mean
+  // "px", "pt", "levels", "%", "degrees"; what plain numbers mean
   const char* unit = "";
   // default, as in a recipe; "": none, and leaving it out is fine; null: must be given
   const char* preset = nullptr;
@@ -52,7 +52,7 @@ struct Parameter {
 };
 
 // What the number of a length counts.
-enum class LengthUnit : uint8_t { Pixels, Percent, Centimeters, Millimeters, Inches };
+enum class LengthUnit : uint8_t { Pixels, Percent, Centimeters, Millimeters, Inches, Points };
 // A length as it was written; what it comes to depends on the picture.
 struct Length {
   double number = 0;

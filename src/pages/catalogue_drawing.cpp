@@ -115,17 +115,18 @@ Status NewCataloguePage(const CatalogueLook& look, PackedImage& page) {
   return Status::Ok;
 }
 
-void DrawCell(const CatalogueLook& look, int32_t index, const PackedImage& image,
-              std::string_view name, CaptionFont* font, PackedImage& page) {
+Status DrawCell(const CatalogueLook& look, int32_t index, const PackedImage& image,
+                std::string_view name, TextFont* font, PackedImage& page) {
   const Rectangle cell = CellPlace(look, index);
   DrawFrame(look, cell, page);
   PutImage(image, cell.x + kPictureInset + (cell.width - image.Width()) / 2,
            cell.y + kPictureInset + (cell.height - image.Height()) / 2, page);
-  if (font == nullptr || !look.names) return;
+  if (font == nullptr || !look.names) return Status::Ok;
   const int32_t below = cell.y + kPictureInset + cell.height;
   const Rectangle band{cell.x + kPictureInset, below + kCaptionTop, cell.width,
                        kCaptionBottom - kCaptionTop};
-  font->DrawCentred(page, band, font->Fitted(name, band.width), look.blackText ? kBlack : kWhite);
+  return font->DrawCentered(page, band, font->Fitted(name, band.width),
+                            look.blackText ? kBlack : kWhite);
 }
 
 }  // namespace fotomill

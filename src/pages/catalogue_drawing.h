@@ -4,7 +4,7 @@
 #include <string_view>
 
 #include "core/status.h"
-#include "drawing/caption_font.h"
+#include "drawing/text_font.h"
 #include "picture/packed_image.h"
 #include "picture/picture_record.h"
 #include "picture/rectangle.h"
@@ -43,9 +43,9 @@ Status MakeCellImage(PictureRecord& picture, const CatalogueLook& look, PackedIm
 // A page of nothing but background. Statuses as NewPackedImage.
 Status NewCataloguePage(const CatalogueLook& look, PackedImage& page);
 // Draws one cell: frame, picture and name (without folder). `font` may be null for a look without
-// names.
-void DrawCell(const CatalogueLook& look, int32_t index, const PackedImage& image,
-              std::string_view name, CaptionFont* font, PackedImage& page);
+// names. MemoryAllocationError.
+Status DrawCell(const CatalogueLook& look, int32_t index, const PackedImage& image,
+                std::string_view name, TextFont* font, PackedImage& page);
 
 // Pixels from line to line of the names' font.
 inline constexpr int32_t kCaptionHeight = 14;

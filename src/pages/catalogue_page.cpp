@@ -70,7 +70,7 @@ class ContactSheet {
         cells_(files.size()) {}
 
   Status OpenFont() {
-    return options_.look.names ? font_.Open(options_.fontName, kCaptionHeight) : Status::Ok;
+    return options_.look.names ? font_.OpenForLine(options_.fontName, kCaptionHeight) : Status::Ok;
   }
 
   void Run() {
@@ -143,8 +143,8 @@ class ContactSheet {
   Status PutCell(const Cell& cell) {
     if (page_ == nullptr) RETURN_IF_BAD(NewPage());
     if (!cell.image.Empty()) {
-      DrawCell(options_.look, drawn_, cell.image, platform::FileNameOf(cell.outcome.source), &font_,
-               page_->image);
+      RETURN_IF_BAD(DrawCell(options_.look, drawn_, cell.image,
+                             platform::FileNameOf(cell.outcome.source), &font_, page_->image));
     }
     ++drawn_;
     return Status::Ok;
@@ -210,7 +210,7 @@ class ContactSheet {
   BatchJob& job_;
   const StopToken stop_;
   std::vector<std::unique_ptr<Cell>> cells_;  // done and not yet on a page
-  CaptionFont font_;
+  TextFont font_;
   PicturePointer page_;               // the one that is being filled
   int32_t drawn_ = 0;                 // its cells
   std::vector<FileOutcome> waiting_;  // files whose page is not written yet

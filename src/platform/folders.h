@@ -19,9 +19,6 @@ enum class SpecialFolder {
 };
 // Asks the environment and the system each time; the folder need not be there.
 std::string SpecialFolderPath(SpecialFolder folder);
-// Where fonts are kept, the user's own first; the folders may have folders in them, and need not be
-// there.
-std::vector<std::string> FontFolders();
 
 // The user's full name as the system knows it, else the login name; empty when it knows neither.
 std::string UserFullName();

@@ -53,7 +53,7 @@ TEST(CatalogueDrawing, FrameAndPicture) {
                                .background = 0x302010};
       PackedImage page;
       ASSERT_EQ(NewCataloguePage(look, page), Status::Ok);
-      DrawCell(look, 0, picture->image, {}, nullptr, page);
+      ASSERT_EQ(DrawCell(look, 0, picture->image, {}, nullptr, page), Status::Ok);
       const int32_t flat = black ? 0 : 0xA0A0A0, light = raised ? 0xFFFFFF : flat,
                     dark = raised ? 0x404040 : flat;
       const struct {
@@ -69,8 +69,8 @@ TEST(CatalogueDrawing, FrameAndPicture) {
 }
 
 TEST(CatalogueDrawing, NamesStayInTheirBand) {
-  CaptionFont font;
-  ASSERT_EQ(font.Open("No Such Family", kCaptionHeight), Status::Ok);
+  TextFont font;
+  ASSERT_EQ(font.OpenForLine("No Such Family", kCaptionHeight), Status::Ok);
   const std::string name = "a & b.jpg", lengthy(100, 'w'), odd = "\xff\xc0\xaf\x01\xe2\x82";
   EXPECT_EQ(font.Fitted(name, 96), name);
   const std::string cut = font.Fitted(lengthy, 96);
@@ -83,7 +83,7 @@ TEST(CatalogueDrawing, NamesStayInTheirBand) {
   for (const std::string& text : {name, lengthy, odd}) {
     PackedImage page;
     ASSERT_EQ(NewCataloguePage(look, page), Status::Ok);
-    DrawCell(look, 0, {}, text, &font, page);
+    ASSERT_EQ(DrawCell(look, 0, {}, text, &font, page), Status::Ok);
     int32_t left = 1000, right = 0, top = 1000, bottom = 0, gray = 0;
     for (int32_t y = 0; y < page.Height(); ++y) {
       for (int32_t x = 0; x < page.Width(); ++x) {

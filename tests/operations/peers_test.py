@@ -7,7 +7,7 @@ import tempfile
 from pathlib import Path
 
 try:
-    from PIL import Image, ImageChops, ImageFilter
+    from PIL import Image, ImageChops, ImageDraw, ImageFilter, ImageFont, ImageOps
 except ImportError:
     print("skipped: needs Pillow (python3-pil)")
     sys.exit(77)
@@ -15,6 +15,7 @@ except ImportError:
 FOTOMILL = os.environ["FOTOMILL"]
 WIDTH, HEIGHT = 161, 97
 faults = []
+LOGO = os.path.join(tempfile.gettempdir(), f"fotomill-peers-{os.getpid()}.png")
 
 
 def sample():
@@ -28,6 +29,33 @@ def sample():
 def perspective(picture):
     """Output (x, y) comes from (x + 0.2 y + 10, y + 5) - a map that Pillow takes as it is."""
     return picture.transform((100, 70), Image.Transform.AFFINE, (1, 0.2, 10, 0, 1, 5), Image.Resampling.BILINEAR)
+
+
+def shadowed(picture):
+    """A shadow 9 to the right and 5 down of a Gaussian of sigma 4; Pillow cuts its blur off a little earlier."""
+    canvas = Image.new("RGB", (WIDTH + 3 + 21, HEIGHT + 7 + 17), "white")
+    mask = Image.new("L", canvas.size)
+    mask.paste(153, (3 + 9, 7 + 5, 3 + 9 + WIDTH, 7 + 5 + HEIGHT))
+    canvas.paste((0, 0, 0), (0, 0), mask.filter(ImageFilter.GaussianBlur(4)))
+    canvas.paste(picture, (3, 7))
+    return canvas
+
+
+def rounded(picture):
+    """Drawn eight times as large and scaled down, since Pillow's own corners are not smooth."""
+    mask = Image.new("L", (WIDTH * 8, HEIGHT * 8))
+    ImageDraw.Draw(mask).rounded_rectangle((0, 0, WIDTH * 8 - 1, HEIGHT * 8 - 1), 20 * 8, 255)
+    canvas = Image.new("RGB", picture.size, "red")
+    canvas.paste(picture, (0, 0), mask.resize(picture.size, Image.Resampling.BOX))
+    return canvas
+
+
+def stamped(picture):
+    """A logo with alpha, as large as the picture, at 60 %."""
+    logo = Image.open(LOGO)
+    alpha = logo.getchannel("A").point(lambda v: v * 153 / 255 + 0.5)
+    logo.putalpha(alpha)
+    return Image.alpha_composite(picture.convert("RGBA"), logo).convert("RGB")
 
 
 # line of a recipe, what Pillow makes of the picture, most levels apart, pixels of the border that are left out
@@ -46,6 +74,12 @@ ROWS = [
     ("median 2", lambda p: p.filter(ImageFilter.MedianFilter(5)), 0, 2),
     ("minimum 1", lambda p: p.filter(ImageFilter.MinFilter(3)), 0, 1),
     ("box-blur 3", lambda p: p.filter(ImageFilter.BoxBlur(3)), 1, 0),
+    ("border 13 #102030", lambda p: ImageOps.expand(p, 13, (0x10, 0x20, 0x30)), 0, 0),
+    ("matt 9 fill=#405060 bevel=none outer-border outer-size=2 outer-color=red",
+     lambda p: ImageOps.expand(ImageOps.expand(p, 9, (0x40, 0x50, 0x60)), 2, "red"), 0, 0),
+    ("shadow 9 5 blur=4 opacity=60 color=black background=white", shadowed, 3, 0),
+    ("round-corners 20 background=red", rounded, 20, 0),
+    (f"watermark picture={LOGO} size=100 margin=0 opacity=60", stamped, 1, 0),
 ]
 
 
@@ -53,6 +87,35 @@ def pasted(picture):
     canvas = Image.new("RGB", (200, HEIGHT), (0x10, 0x20, 0x30))
     canvas.paste(picture, (0, 0))
     return canvas
+
+
+def letters():
+    """What the text operation covers, and what Pillow's own text does, with the same font at the same place."""
+    font = next(iter(sorted(Path("/usr/share/fonts").rglob("DejaVuSans.ttf"))), None)
+    if font is None:
+        return
+    text, size = "Wagner & Söhne, fjord", (400, 60)
+    ours = folder_picture(f"canvas 400x60 background=white; text '{text}' font='DejaVu Sans' size=30px color=black")
+    expected = Image.new("L", size, 255)
+    draw = ImageDraw.Draw(expected)
+    draw.text((200, 30), text, 0, ImageFont.truetype(str(font), 30), anchor="mm")
+    boxes = [ImageChops.invert(picture).point(lambda v: 255 if v > 60 else 0).getbbox() for picture in (ours, expected)]
+    widths, heights = ([box[2 + i] - box[i] for box in boxes] for i in (0, 1))
+    inks = [sum(255 - v for v in picture.getdata()) for picture in (ours, expected)]
+    if abs(widths[0] - widths[1]) > 4 or abs(heights[0] - heights[1]) > 2 or not 0.93 < inks[0] / inks[1] < 1.07:
+        faults.append(f"letters: {boxes}, ink {inks}")
+
+
+def folder_picture(line):
+    """A white pixel, put through a recipe."""
+    with tempfile.TemporaryDirectory() as name:
+        Image.new("L", (1, 1), 255).save(Path(name, "a.png"))
+        run = subprocess.run([FOTOMILL, "apply", Path(name, "a.png"), "--do", line, "--out", Path(name, "b.png"), "--to", "png"],
+                             capture_output=True, text=True, check=False)
+        if run.returncode != 0:
+            faults.append(f"{line}: {run.stderr}")
+            return Image.new("L", (400, 60), 255)
+        return Image.open(Path(name, "b.png")).convert("L")
 
 
 def inside(picture, expected, border):
@@ -84,8 +147,13 @@ with tempfile.TemporaryDirectory() as name:
     work = Path(name)
     (work / "out").mkdir()
     sample().save(work / "in.png")
+    logo = sample().transpose(Image.Transpose.FLIP_LEFT_RIGHT)
+    logo.putalpha(sample().getchannel("R"))
+    logo.save(LOGO)
     for row in ROWS:
         judge(work, *row)
+    os.unlink(LOGO)
+    letters()
 
 for fault in faults:
     print(fault)

@@ -111,17 +111,6 @@ std::string SpecialFolderPath(SpecialFolder folder) {
   return {};
 }
 
-std::vector<std::string> FontFolders() {
-  std::string data = FolderFromEnvironment("XDG_DATA_HOME");
-  const std::string home = SpecialFolderPath(SpecialFolder::Home);
-  if (data.empty() && !home.empty()) data = home + "/.local/share";
-  std::vector<std::string> folders;
-  if (!data.empty()) folders.push_back(data + "/fonts");
-  if (!home.empty()) folders.push_back(home + "/.fonts");
-  folders.insert(folders.end(), {"/usr/local/share/fonts", "/usr/share/fonts"});
-  return folders;
-}
-
 // The first field of the entry's comment is the full name, in which "&" stands for the login name.
 std::string UserFullName() {
   passwd entry;

@@ -18,11 +18,12 @@ enum class SetupPage {
   Saving,
   Names,
   Colors,
+  Captions,
   Metadata,
   History,
   Formats
 };
-inline constexpr size_t kSetupPageCount = 10;
+inline constexpr size_t kSetupPageCount = 11;
 // The title of a page in English.
 const char* TitleOf(SetupPage page);
 

@@ -1,0 +1,34 @@
+#pragma once
+
+#include <cstdint>
+
+#include "picture/packed_image.h"
+
+namespace fotomill {
+
+// A rectangle anywhere, turned about its center and with rounded corners.
+struct Shape {
+  double x = 0, y = 0;  // its center, in pixels from the mask's top left corner
+  double width = 0, height = 0;
+  double angle = 0;     // degrees, clockwise
+  double radius = 0;    // of the corners; more than half an edge counts as half of it
+};
+
+// How much of each pixel a shape covers. Edges along pixels are sharp, others smooth over one pixel.
+// Source: the signed distance of a rounded box, I. Quilez, "2D distance functions".
+class ShapeCoverage {
+ public:
+  explicit ShapeCoverage(const Shape& shape);
+  uint8_t At(int32_t x, int32_t y) const;  // column and row; 0 to 255
+
+ private:
+  const Shape shape_;
+  const double cosine_, sine_, radius_;
+};
+
+// Adds a shape to an alpha plane: each pixel gets the larger of what it has and its coverage.
+void DrawShape(const Shape& shape, PackedImage& mask);
+// Takes a shape out of an alpha plane.
+void CutShape(const Shape& shape, PackedImage& mask);
+
+}  // namespace fotomill

@@ -1,0 +1,16 @@
+#pragma once
+
+#include "core/status.h"
+#include "drawing/font_faces.h"
+#include "drawing/text_line.h"
+#include "picture/packed_image.h"
+
+namespace fotomill {
+
+// Adds a line to a mask, which is an alpha plane: 255 where letters cover a pixel wholly. What lies
+// outside the mask is left out. `fonts` are those that the line was shaped with.
+// MemoryAllocationError.
+Status DrawLine(const FontFaces& fonts, const TextLine& line, const LinePlace& place,
+                PackedImage& mask);
+
+}  // namespace fotomill
