@@ -14,6 +14,7 @@
 #include "cli/commands/plugins.h"
 #include "cli/commands/recipe.h"
 #include "cli/commands/rename.h"
+#include "cli/commands/similar.h"
 #include "cli/commands/tdb.h"
 #include "cli/commands/thumbs.h"
 #include "cli/commands/turn.h"
@@ -43,6 +44,7 @@ constexpr Command kCommands[] = {
     {"exif",    TrLater("show EXIF, or extract the embedded thumbnail"),                Needs::Formats,  SetUpExif},
     {"faces",   TrLater("find faces in pictures"),                                      Needs::Formats,  SetUpFaces},
     {"plugins", TrLater("list the plug-in formats"),                                    Needs::Settings, SetUpPlugins},
+    {"similar", TrLater("find pictures that look alike"),                               Needs::Formats,  SetUpSimilar},
     {"verify",  TrLater("decode files completely to find damaged ones"),                Needs::Formats,  SetUpVerify},
     {"config list",  TrLater("list the configuration keys and their values"),           Needs::Settings, SetUpConfigList},
     {"config get",   TrLater("print the values of keys"),                               Needs::Settings, SetUpConfigGet},
