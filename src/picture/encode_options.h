@@ -1,10 +1,15 @@
 #pragma once
 
 #include <cstdint>
+#include <string>
+#include <string_view>
 
 #include "core/choice_lists.h"
 
 namespace fotomill {
+
+// The default of TextCharacterLevels.
+inline constexpr std::string_view kTextLevels = "\xff.:-+|=%o#&XOB@";
 
 // What of the settings encoding depends on. The values here are the settings' defaults; a job takes
 // those in force once, by EncodeOptionsFromSettings. Numbers may lie outside their ranges: writers
@@ -29,6 +34,9 @@ struct EncodeOptions {
   bool macBinary = false;                           // CreateMacbinaryHeader
   int32_t pngCompression = 9;                       // PngCompression: level of deflate, 0 to 9
   bool targa16 = false;                             // CreateTarga16
+  // TextCharacterLevels: characters from the least ink to the most
+  std::string textLevels = std::string(kTextLevels);
+  bool textInverted = false;                        // InvertTextFiles: light text on a dark screen
   int32_t tiffCompression = choice::kTiffLzw;       // TiffOptions
   bool webpLossless = false;                        // WebPLossless
   int32_t webpQuality = 75;                         // WebPQualityFactor, 0 to 100

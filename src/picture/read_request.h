@@ -28,6 +28,8 @@ struct ReadOptions {
   IdentifyOptions identify = {};
   // PhotoCDResolution: the largest size that is taken out of a Photo CD file
   int32_t photoCdSize = choice::kPhotoCd3072;
+  bool textInverted = false;     // InvertTextFiles: texts are white on black
+  bool relaxedUuencode = false;  // RelaxedUUE: cut lines and stray text are passed over
   bool operator==(const ReadOptions&) const = default;
 };
 

@@ -101,7 +101,6 @@ constexpr SignatureOfRow kWithoutCodec[] = {
     {"",     {0, "<!doctype html"sv, "HTML"}},
     {"",     {0, "<html"sv, "HTML"}},
     {"XPM",  {0, "/* XPM */"sv, "XPM"}},
-    {"UUE",  {0, "begin "sv, "UUE"}},
     {"PBM",  {0, "P1\n"sv, "PBM"}},
     {"PGM",  {0, "P2\n"sv, "PGM"}},
     {"PPM",  {0, "P3\n"sv, "PPM"}},

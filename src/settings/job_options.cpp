@@ -34,7 +34,9 @@ ReadOptions ReadOptionsFromSettings() {
           .identify = {.on = settings.IdentifyMysteryViewFiles != 0,
                        .exceptions = std::string(settings.BatchIdentifyExceptions),
                        .mostSide = settings.MaximumMysteryFileDimension},
-          .photoCdSize = settings.PhotoCDResolution};
+          .photoCdSize = settings.PhotoCDResolution,
+          .textInverted = settings.InvertTextFiles != 0,
+          .relaxedUuencode = settings.RelaxedUUE != 0};
 }
 
 EncodeOptions EncodeOptionsFromSettings() {
@@ -55,6 +57,8 @@ EncodeOptions EncodeOptionsFromSettings() {
           .macBinary = settings.CreateMacbinaryHeader != 0,
           .pngCompression = settings.PngCompression,
           .targa16 = settings.CreateTarga16 != 0,
+          .textLevels = std::string(settings.TextCharacterLevels.view()),
+          .textInverted = settings.InvertTextFiles != 0,
           .tiffCompression = settings.TiffOptions,
           .webpLossless = settings.WebPLossless != 0,
           .webpQuality = settings.WebPQualityFactor,

@@ -32,6 +32,8 @@ struct Keeping {
 // clang-format off
 constexpr Keeping kKeepings[] = {
     {"MAC", Keeps::Nothing},                        // one size for all pictures
+    {"TXT", Keeps::Nothing},                        // characters, which are drawn larger
+    {"UUE", Keeps::Size},                           // a JPEG inside
     {"FIT", Keeps::Size}, {"FTS", Keeps::Size},     // gray only
     {"JPG", Keeps::Size}, {"JPEG", Keeps::Size},    // lossy
     {"JPE", Keeps::Size}, {"JFI", Keeps::Size},

@@ -1,0 +1,36 @@
+#include "formats/rows.h"
+
+#include "formats/text/txt.h"
+#include "texts/texts.h"
+
+namespace fotomill {
+
+namespace {
+
+using namespace std::string_view_literals;
+
+constexpr FormatSetting kKeys[] = {
+    {"TextCharacterLevels", TrLater("Text (TXT): characters from light to dark")},
+    {"InvertTextFiles", TrLater("Text (TXT): light text on a dark screen")},
+};
+constexpr FormatSettings kSettings = {"TXT", "OverrideTxtBox", TrLater("Other formats"), kKeys};
+
+constexpr FormatEntry kRows[] = {{
+    .info = TxtInfo,
+    .read = TxtRead,
+    .write = TxtWrite,
+    .maxBits = 24,
+    .extension = "TXT"sv,
+    .description = "(TXT) Text files"sv,
+    .enabled = 1,
+    .flags = FMT_BITMAP,
+    .canRead = true,
+    .canWrite = true,
+    .settings = &kSettings,
+}};
+
+}  // namespace
+
+std::span<const FormatEntry> TextRows() { return kRows; }
+
+}  // namespace fotomill

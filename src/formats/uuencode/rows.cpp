@@ -1,0 +1,39 @@
+#include "formats/rows.h"
+
+#include "formats/uuencode/uue.h"
+#include "texts/texts.h"
+
+namespace fotomill {
+
+namespace {
+
+using namespace std::string_view_literals;
+
+constexpr Signature kSignatures[] = {{0, "begin "sv, "UUE"}};
+
+constexpr FormatSetting kKeys[] = {
+    {"RelaxedUUE", TrLater("UUEncoded (UUE): pass over damaged lines")},
+};
+constexpr FormatSettings kSettings = {"UUE", "OverrideUueBox", TrLater("Other formats"), kKeys};
+
+constexpr FormatEntry kRows[] = {{
+    .info = UueInfo,
+    .read = UueRead,
+    .write = UueWrite,
+    .maxBits = 24,
+    .extension = "UUE"sv,
+    .description = "(UUE) UUEncoded graphics"sv,
+    .enabled = 1,
+    .flags = FMT_BITMAP | FMT_SECONDARY,
+    .canRead = true,
+    .canWrite = true,
+    .signatures = kSignatures,
+    .keepsMetadata = kAllMetadata,
+    .settings = &kSettings,
+}};
+
+}  // namespace
+
+std::span<const FormatEntry> UuencodeRows() { return kRows; }
+
+}  // namespace fotomill
