@@ -75,7 +75,7 @@ Status DrawText(const TextLines& text, uint8_t paper, const PictureRecord& pictu
   for (size_t i = 0; i < text.lines.size(); ++i) {
     const int32_t top = kMargin + static_cast<int32_t>(i) * kGlyphHeight;
     DrawLine(text.lines[i], top, paper, image);
-    RETURN_IF_BAD(picture.ReportRow(top));
+    for (int32_t y = 0; y < kGlyphHeight; ++y) RETURN_IF_BAD(picture.ReportRow(top + y));
   }
   return Status::Ok;
 }
