@@ -56,7 +56,9 @@ TEST(Cut, WritesRunsFromThreePixels) {
   for (int32_t x = 0; x < 300; ++x) SetPixel(wide->image, x, 0, 1);
   EXPECT_EQ(Encode(CutWrite, *wide), Hex("2C01 0100 0000  0700 FF 01 FF 01 AE 01 00"));
   Status status = Status::Ok;
-  EXPECT_TRUE(Encode(CutWrite, *PatternPicture(65536, 1, 8), &status).empty());
+  const PicturePointer widest = PatternPicture(65535, 1, 8);
+  for (int32_t x = 0; x < 65535; ++x) SetPixel(widest->image, x, 0, x % 2);
+  EXPECT_TRUE(Encode(CutWrite, *widest, &status).empty());  // its code needs more than 65535 bytes
   EXPECT_EQ(status, Status::UnsuitableImage);
   EXPECT_TRUE(Encode(CutWrite, *PatternPicture(3, 1, 24), &status).empty());
   EXPECT_EQ(status, Status::TooManyColors);

@@ -71,7 +71,7 @@ TEST(Uuencode, DecodesLines) {
 
 TEST(Uuencode, EncodesLines) {
   EXPECT_EQ(Wrapped(BytesOf("Cat"), "a.gif"), "begin 644 a.gif\n#0V%T\n`\nend\n");
-  EXPECT_EQ(Wrapped(Hex("00 00 00 FF"), "a\n/b"), "begin 644 a__b\n$`````_P``\n`\nend\n");
+  EXPECT_EQ(Wrapped(Hex("00 00 00 FF"), "a\n/b"), "begin 644 a__b\n$````_P``\n`\nend\n");
   Bytes long46(46);
   for (size_t i = 0; i < long46.size(); ++i) long46[i] = static_cast<uint8_t>(i * 37);
   const std::string text = Wrapped(long46, "x");

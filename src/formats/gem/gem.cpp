@@ -404,7 +404,6 @@ Status GemWrite(PictureRecord& picture, const WriteOptions& options) {
   const ProgressScope progress(picture);
   const PackedImage& image = picture.image;
   if (image.Empty()) return Status::MemoryAllocationError;
-  if (image.Width() > UINT16_MAX || image.Height() > UINT16_MAX) return Status::UnsuitableImage;
   const GemLayout layout = ChooseLayout(picture);
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;

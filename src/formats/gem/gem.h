@@ -11,7 +11,7 @@ namespace fotomill {
 // that are not read.
 Status GemInfo(PictureRecord& picture, const ReadRequest& request);
 Status GemRead(PictureRecord& picture, const ReadRequest& request);
-// Also UnsuitableImage (13) for sides above 65535, ErrorCreatingFile (10), ErrorWritingFile (11).
+// Also ErrorCreatingFile (10), ErrorWritingFile (11).
 Status GemWrite(PictureRecord& picture, const WriteOptions& options);
 
 }  // namespace fotomill

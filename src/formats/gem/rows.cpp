@@ -19,6 +19,7 @@ constexpr FormatEntry kRows[] = {{
     .read = GemRead,
     .write = GemWrite,
     .maxBits = 24,
+    .limits = {UINT16_MAX, UINT16_MAX},
     .extension = "IMG"sv,
     .description = "(IMG) GEM/Ventura"sv,
     .enabled = 1,

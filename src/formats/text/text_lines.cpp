@@ -100,8 +100,10 @@ bool ReadTextLines(std::span<const uint8_t> file, bool whole, TextLines& text) {
   std::string_view rest(reinterpret_cast<const char*>(file.data()), file.size());
   if (rest.find('\0') != std::string_view::npos) return false;
   if (rest.starts_with(kUtf8Mark)) rest.remove_prefix(kUtf8Mark.size());
-  // A file that is not seen whole may end within a character.
-  const bool utf8 = IsUtf8(whole ? rest : CutText(rest, rest.empty() ? 0 : rest.size() - 1));
+  // A file that is not seen whole may end within a character of up to four bytes.
+  bool utf8 = IsUtf8(rest);
+  for (size_t cut = 1; !utf8 && !whole && cut < std::min<size_t>(4, rest.size()); ++cut)
+    utf8 = IsUtf8(rest.substr(0, rest.size() - cut));
   text.coding = utf8 ? TextCoding::Utf8 : TextCoding::Windows1252;
   while (!rest.empty()) {
     char32_t c;

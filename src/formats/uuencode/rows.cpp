@@ -21,6 +21,7 @@ constexpr FormatEntry kRows[] = {{
     .read = UueRead,
     .write = UueWrite,
     .maxBits = 24,
+    .limits = {65500, 65500},  // of the JPEG inside
     .extension = "UUE"sv,
     .description = "(UUE) UUEncoded graphics"sv,
     .enabled = 1,

@@ -15,6 +15,7 @@ constexpr FormatEntry kRows[] = {{
     .read = WpgRead,
     .write = WpgWrite,
     .maxBits = 8,
+    .limits = {UINT16_MAX, UINT16_MAX},
     .extension = "WPG"sv,
     .description = "(WPG) WordPerfect Graphics"sv,
     .enabled = 1,

@@ -385,7 +385,6 @@ Status WpgWrite(PictureRecord& picture, const WriteOptions& options) {
   const PackedImage& image = picture.image;
   if (image.Empty()) return Status::MemoryAllocationError;
   if (image.Bits() > 8) return Status::TooManyColors;
-  if (image.Width() > UINT16_MAX || image.Height() > UINT16_MAX) return Status::UnsuitableImage;
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
   WriteHead(out, picture);

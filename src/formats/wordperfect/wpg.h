@@ -12,7 +12,7 @@ namespace fotomill {
 // drawings without a bitmap, InvalidPassword (25) for encrypted files.
 Status WpgInfo(PictureRecord& picture, const ReadRequest& request);
 Status WpgRead(PictureRecord& picture, const ReadRequest& request);
-// Also TooManyColors (12) above 8 bits, UnsuitableImage (13) for sides above 65535,
+// Also TooManyColors (12) above 8 bits, UnsuitableImage (13) for more than 2 GiB of code,
 // ErrorCreatingFile (10), ErrorWritingFile (11).
 Status WpgWrite(PictureRecord& picture, const WriteOptions& options);
 
