@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include "core/limits.h"
 #include "formats/bmp/bmp.h"
 #include "formats/uuencode/uuencode.h"
 #include "platform/output_file.h"
@@ -69,6 +70,17 @@ TEST(Uuencode, DecodesLines) {
   EXPECT_EQ(cut.bytes, Hex("43 60 00"));  // what is missing is 0
 }
 
+// Lines of nothing but their number give 22 times what they take.
+TEST(Uuencode, KeepsToTheLimitOfMemory) {
+  const Limits saved = limits;
+  limits.fileMemoryBytes = 10000;
+  std::string text = "begin 644 a\n";
+  for (int i = 0; i < 200; ++i) text += "M\n";
+  UuencodedFile file;
+  EXPECT_EQ(DecodeUuencoded(BytesOf(text), true, file), Status::MemoryAllocationError);
+  limits = saved;
+}
+
 TEST(Uuencode, EncodesLines) {
   EXPECT_EQ(Wrapped(BytesOf("Cat"), "a.gif"), "begin 644 a.gif\n#0V%T\n`\nend\n");
   EXPECT_EQ(Wrapped(Hex("00 00 00 FF"), "a\n/b"), "begin 644 a__b\n$````_P``\n`\nend\n");
@@ -98,7 +110,7 @@ TEST(Uue, TheFileInsideIsReadByItsRow) {
       {"a name that lies", Wrapped(bitmap, "a.gif"), Status::Ok, 5},
       {"a name of OS/2", Wrapped(icon, "a.ico"), Status::Ok, 1},
       {"no extension", Wrapped(bitmap, "picture"), Status::Ok, 5},
-      {"a longer extension", Wrapped(BytesOf("text"), "a.text"), Status::Ok, 4 * 8 + 16},
+      {"a longer extension", Wrapped(BytesOf("text"), "a.txts"), Status::Ok, 4 * 8 + 16},
       {"text within text", nested, Status::UnsupportedFormat, 0},
       {"that says to be something else", Wrapped(BytesOf(Wrapped(bitmap, "a.bmp")), "a"), Status::UnsupportedFormat, 0},
       {"an archive", Wrapped(Hex("504B0304 00000000"), "a.zip"), Status::UnsupportedFormat, 0},

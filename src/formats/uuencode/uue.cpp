@@ -3,8 +3,11 @@
 #include "formats/uuencode/uue.h"
 
 #include <algorithm>
+#include <functional>
 #include <string>
 #include <string_view>
+#include <utility>
+#include <vector>
 
 #include "core/text.h"
 #include "formats/gif/gif.h"
@@ -65,21 +68,6 @@ bool Fits(const Signature& signature, std::span<const uint8_t> bytes) {
   return has(signature.offset, signature.bytes) && has(signature.secondOffset, signature.second);
 }
 
-// The usable row with the longest signature that the bytes have; null if there is none.
-const FormatEntry* RowOfContents(std::span<const uint8_t> bytes) {
-  const FormatEntry* best = nullptr;
-  size_t length = 0;
-  ForEachRow([&](const FormatEntry& row) {
-    for (const Signature& signature : row.signatures) {
-      const size_t own = signature.bytes.size() + signature.second.size();
-      if (own <= length || !IsUsable(row) || !Fits(signature, bytes)) continue;
-      best = &row;
-      length = own;
-    }
-  });
-  return best;
-}
-
 // A file that was wrapped, on disk for its row.
 struct Unwrapped {
   std::string name;
@@ -89,10 +77,25 @@ struct Unwrapped {
 };
 
 // A row reads the file when its `info` does.
-bool Takes(const FormatEntry* row, const ReadRequest& request) {
+bool Takes(const FormatEntry& row, const ReadRequest& request) {
   const PicturePointer picture = NewPictureRecord();
-  return row != nullptr && IsUsable(*row) && picture != nullptr &&
-         row->info(*picture, request) == Status::Ok;
+  return IsUsable(row) && picture != nullptr && row.info(*picture, request) == Status::Ok;
+}
+
+// The row that takes the file, of those whose signature its bytes have the one with the longest.
+// Null if there is none.
+const FormatEntry* RowOfContents(std::span<const uint8_t> bytes, const ReadRequest& request) {
+  std::vector<std::pair<size_t, const FormatEntry*>> fitting;
+  ForEachRow([&](const FormatEntry& row) {
+    for (const Signature& signature : row.signatures) {
+      if (Fits(signature, bytes))
+        fitting.emplace_back(signature.bytes.size() + signature.second.size(), &row);
+    }
+  });
+  std::ranges::stable_sort(fitting, std::greater(), [](const auto& pair) { return pair.first; });
+  const auto found =
+      std::ranges::find_if(fitting, [&](const auto& pair) { return Takes(*pair.second, request); });
+  return found == fitting.end() ? nullptr : found->second;
 }
 
 Status Unwrap(const ReadRequest& request, uint64_t& fileSize, Unwrapped& inner) {
@@ -107,23 +110,24 @@ Status Unwrap(const ReadRequest& request, uint64_t& fileSize, Unwrapped& inner) 
   if (extension.starts_with('.')) extension.remove_prefix(1);
   const FormatEntry* const named = RowOfExtension(extension);
   if (named != nullptr && IsWrapper(*named)) return Status::UnsupportedFormat;
-  inner.row = named != nullptr ? named : RowOfContents(decoded.bytes);
-  if (inner.row == nullptr) return Status::UnsupportedFormat;
   // Some rows tell their variants by the extension, so the file has that of its row.
-  if (!inner.file.Create("." + LowerCase(inner.row->extension.view())) ||
-      !inner.file.Write(decoded.bytes))
+  std::string ending(named == nullptr ? "" : ".");
+  if (named != nullptr) ending += LowerCase(named->extension.view());
+  if (!inner.file.Create(ending) || !inner.file.Write(decoded.bytes))
     return Status::ErrorCreatingFile;
   inner.request = request;
   inner.request.fileName = inner.file.Path();
-  if (named != nullptr && !Takes(named, inner.request)) {
-    const FormatEntry* const meant = RowOfContents(decoded.bytes);
-    if (meant != named && Takes(meant, inner.request)) inner.row = meant;
+  inner.row = named;
+  if (named == nullptr || !Takes(*named, inner.request)) {
+    const FormatEntry* const meant = RowOfContents(decoded.bytes, inner.request);
+    if (meant != nullptr) inner.row = meant;
   }
-  return IsUsable(*inner.row) ? Status::Ok : Status::UnsupportedFormat;
+  return inner.row != nullptr && IsUsable(*inner.row) ? Status::Ok : Status::UnsupportedFormat;
 }
 
 void NameType(const Unwrapped& inner, PictureRecord& picture) {
-  picture.typeName.AssignCut("UUEncoded " + inner.name);
+  std::string type("UUEncoded ");
+  picture.typeName.AssignCut(type.append(inner.name));
 }
 
 }  // namespace
@@ -174,8 +178,8 @@ Status UueWrite(PictureRecord& picture, const WriteOptions& options) {
   if (!wrapped.Open(file.Path())) return Status::ErrorWritingFile;
   ByteWriter out;
   if (!out.Create(destination.c_str())) return Status::ErrorCreatingFile;
-  const std::string name(platform::SplitPath(destination.view()).base);
-  EncodeUuencoded(wrapped.Bytes(), name + std::string(extension), out);
+  std::string name(platform::SplitPath(destination.view()).base);
+  EncodeUuencoded(wrapped.Bytes(), name.append(extension), out);
   if (!wrapped.Intact()) return Status::ErrorWritingFile;
   return CommitOutput(out, options);
 }

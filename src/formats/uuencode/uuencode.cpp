@@ -75,14 +75,14 @@ Status DecodeUuencoded(std::span<const uint8_t> text, bool relaxed, UuencodedFil
     if (line.starts_with(kBase64)) return Status::UnsupportedFormat;
     begun = ParseBegin(line, file.name);
   }
-  RETURN_IF_BAD(CheckFileMemory(rest.size()));
-  file.bytes.reserve(rest.size() / 4 * 3 + 3);
   while (!rest.empty()) {
     const std::string_view line = TakeLine(rest);
     const LineKind kind = KindOf(line);
     if (line == kEnd) return Status::Ok;
     if (kind == LineKind::Data || (kind == LineKind::Cut && relaxed)) {
       if (ValueOf(line[0]) == 0 && line.size() <= 1 + kMostExtra) return Status::Ok;
+      // Lines that are filled up give more than they take; the buffer is copied when it grows.
+      RETURN_IF_BAD(CheckFileMemory(3 * uint64_t{file.bytes.size()}));
       DecodeLine(line, file.bytes);
     } else if (!relaxed) {
       return kind == LineKind::Cut && rest.empty() ? Status::FileReadError : Status::DamagedFile;
