@@ -29,7 +29,11 @@ TEST(JobOptions, HoldEveryKeyOfTheFormats) {
       const ReadOptions read = ReadOptionsFromSettings();
       const KeyRow* const row = FindKey(setting.key);
       ASSERT_NE(row, nullptr);
-      StoreNumber(*row, NumberIn(*row) == 0 ? 1 : 0);
+      if ((row->type & KEY_TEXT) != 0) {
+        StoreText(*row, "another");
+      } else {
+        StoreNumber(*row, NumberIn(*row) == 0 ? 1 : 0);
+      }
       EXPECT_TRUE(EncodeOptionsFromSettings() != encode || ReadOptionsFromSettings() != read);
     }
   }
