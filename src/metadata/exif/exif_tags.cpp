@@ -201,13 +201,13 @@ constexpr ExifTag kTags[] = {
 };
 // clang-format on
 
-constexpr size_t kTagCount = 127;
-static_assert(std::size(kTags) == kTagCount);
+constexpr size_t kTagCount = std::size(kTags);
 
 // Rows by tag number: an open-addressed table of row numbers, built by the compiler, which also
 // refuses a tag that is there twice.
 constexpr size_t kSlotCount = 512;
 constexpr uint8_t kEmptySlot = 0xff;
+static_assert(kTagCount < kEmptySlot && 2 * kTagCount < kSlotCount);
 constexpr size_t FirstSlot(uint16_t tag) { return (tag * 0x9e3779b1u >> 16) % kSlotCount; }
 
 consteval std::array<uint8_t, kSlotCount> MakeSlots() {
