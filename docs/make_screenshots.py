@@ -15,10 +15,14 @@ PROJECT = Path(__file__).resolve().parents[1]
 sys.path.insert(0, str(PROJECT / "tests/desktop"))
 from driven_desktop import Desktop  # noqa: E402
 
-NAMES = ["Aurora.jpg", "Autumn hills.png", "Blue hour.tif", "Canyon.jpg", "Coast at noon.bmp", "Dunes.webp", "Early light.jpg",
-         "Evening.pcx", "Fjord.jpg", "Foothills.tga", "Green valley.jpg", "Harvest moon.png", "Heather.jpg", "Ice field.tif",
-         "Lavender.jpg", "Meadow.webp", "Mist.jpg", "Moor.png", "North ridge.jpg", "Ochre.gif", "Pass.jpg", "Red sky.bmp",
-         "River bend.jpg", "Savanna.png", "Second winter.jpg", "Summer haze.tga", "Tundra.jpg", "Violet dusk.webp"]
+NAMES = ["Aurora.jpg", "Autumn hills.png", "Blue hour.tif", "Canyon.jpg", "Coast at noon.bmp",
+         "Dunes.webp", "Early light.jpg",
+         "Evening.pcx", "Fjord.jpg", "Foothills.tga", "Green valley.jpg", "Harvest moon.png",
+         "Heather.jpg", "Ice field.tif",
+         "Lavender.jpg", "Meadow.webp", "Mist.jpg", "Moor.png", "North ridge.jpg", "Ochre.gif",
+         "Pass.jpg", "Red sky.bmp",
+         "River bend.jpg", "Savanna.png", "Second winter.jpg", "Summer haze.tga", "Tundra.jpg",
+         "Violet dusk.webp"]
 
 
 def landscape(seed, width, height):
@@ -26,11 +30,14 @@ def landscape(seed, width, height):
     dice = random.Random(seed)
     top = [dice.randint(30, 190) for _ in range(3)]
     low = [dice.randint(150, 255) for _ in range(3)]
-    sun = (dice.randint(width // 6, width * 5 // 6), dice.randint(height // 8, height // 3), dice.randint(height // 16, height // 9))
+    sun = (dice.randint(width // 6, width * 5 // 6), dice.randint(height // 8, height // 3),
+           dice.randint(height // 16, height // 9))
     phases = [(dice.random() * 6, dice.random() * 6) for _ in range(4)]
-    ranges = [bytes(min(255, int(level * (0.8 - 0.17 * layer))) for level in top) for layer in range(4)]
+    ranges = [bytes(min(255, int(level * (0.8 - 0.17 * layer))) for level in top)
+              for layer in range(4)]
     ridges = [[height * (0.45 + 0.14 * layer) - height / 15 * math.sin(x / (width / 10 + 20 * layer) + phases[layer][0])
-               - height / 27 * math.sin(x / (width / 24) + phases[layer][1]) for x in range(width)] for layer in range(4)]
+               - height / 27 * math.sin(x / (width / 24) + phases[layer][1]) for x in range(width)]
+               for layer in range(4)]
     rows = []
     for y in range(height):
         part = y / height
@@ -49,18 +56,21 @@ def landscape(seed, width, height):
 def write_bitmap(path, seed, width, height):
     pixels = landscape(seed, width, height)
     path.write_bytes(struct.pack("<2sIHHI", b"BM", 54 + len(pixels), 0, 0, 54) +
-                     struct.pack("<IiiHHIIiiII", 40, width, height, 1, 24, 0, len(pixels), 2835, 2835, 0, 0) + pixels)
+                     struct.pack("<IiiHHIIiiII", 40, width, height, 1, 24, 0, len(pixels), 2835,
+                                 2835, 0, 0) + pixels)
 
 
 def make_pictures(folder):
     (folder / "Panoramas").mkdir()
     for seed, name in enumerate(NAMES):
         target = folder / name
-        width, height = (1120, 680) if name == "Fjord.jpg" else [(480, 320), (320, 440), (560, 260), (480, 360)][seed % 4]
+        width, height = (1120, 680) if name == "Fjord.jpg" else [(480, 320), (320, 440), (560, 260),
+                                                                 (480, 360)][seed % 4]
         bitmap = target.with_suffix(".bmp")
         write_bitmap(bitmap, seed + 40, width, height)
         if target.suffix != ".bmp":
-            subprocess.run([PROJECT / "build/release/fotomill", "convert", bitmap, "--out", target, "--reduce"], check=True,
+            subprocess.run([PROJECT / "build/release/fotomill", "convert", bitmap, "--out", target,
+                            "--reduce"], check=True,
                            stdout=subprocess.DEVNULL)
             bitmap.unlink()
 
@@ -69,7 +79,8 @@ def keep(desktop, name):
     desktop.screenshot(name)
     made = PROJECT / f"build/screenshots/{name}.png"
     # Written anew by our own encoder, which takes a fraction of the space.
-    subprocess.run([PROJECT / "build/release/fotomill", "convert", made, "--out", PROJECT / f"docs/{name}.png", "--overwrite", "replace"],
+    subprocess.run([PROJECT / "build/release/fotomill", "convert", made, "--out",
+                    PROJECT / f"docs/{name}.png", "--overwrite", "replace"],
                    check=True, stdout=subprocess.DEVNULL)
 
 
@@ -80,7 +91,8 @@ def main():
             (folder / "home" / name).mkdir(parents=True)
         pictures = folder / "home/Pictures/Landscapes"
         make_pictures(pictures)
-        settings = ["UpdateThumbnailsFlag=0", "WarnDestinationWrite=0", "CloseProgressWhenDone=0", "DestForceSourceDir=1",
+        settings = ["UpdateThumbnailsFlag=0", "WarnDestinationWrite=0", "CloseProgressWhenDone=0",
+                    "DestForceSourceDir=1",
                     "DefaultFileExtension=pcx"]
         with Desktop(folder, pictures, settings=settings, size=(1180, 760)) as desktop:
             desktop.wait(r"missing=0 listing=0")

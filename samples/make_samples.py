@@ -1,8 +1,9 @@
 #!/usr/bin/env python3
-"""Draws a windmill and writes it as every kind of picture file that a user meets, one of them damaged.
+"""Draws a windmill and writes it as every kind of picture file that a user meets, one of them
+damaged.
 
-make_samples.py [FOLDER]: writes into FOLDER, by default the folder of this script. The Python standard library is all it
-needs. README.md beside it says what each file is.
+make_samples.py [FOLDER]: writes into FOLDER, by default the folder of this script. The Python
+standard library is all it needs. README.md beside it says what each file is.
 """
 import math
 import struct
@@ -42,7 +43,8 @@ def land(x, y):
         return (0.42, 0.44, 0.58) if y > distant else None
     row = (x - 0.70) * 0.84 / (y - 0.60)
     across = abs(row - math.floor(row) - 0.5)
-    flowers = ((0.85, 0.16, 0.20), (0.96, 0.78, 0.18), (0.80, 0.25, 0.55), (0.95, 0.48, 0.16))[math.floor(row) % 4]
+    flowers = ((0.85, 0.16, 0.20), (0.96, 0.78, 0.18), (0.80, 0.25, 0.55),
+               (0.95, 0.48, 0.16))[math.floor(row) % 4]
     grass = mix((0.40, 0.58, 0.28), (0.20, 0.42, 0.18), (y - 0.655) * 3)
     color = mix((0.45, 0.52, 0.38), flowers if across < 0.27 else grass, (y - 0.655) * 9)
     return mix(color, (0.10, 0.12, 0.08), (y - 0.80) * 0.8)
@@ -73,7 +75,8 @@ def mill(x, y):
     if abs(dx) < 0.018 and y > 0.725 or abs(dx) < 0.012 and 0.49 < y < 0.525:
         return (0.25, 0.16, 0.12)
     joint = 0.03 if (y * 55) % 1 < 0.25 else 0.0
-    return mix((0.45 - joint, 0.30 - joint, 0.25 - joint), (0.93 - joint, 0.76 - joint, 0.60 - joint), dx / half / 2 + 0.5)
+    return mix((0.45 - joint, 0.30 - joint, 0.25 - joint),
+               (0.93 - joint, 0.76 - joint, 0.60 - joint), dx / half / 2 + 0.5)
 
 
 def draw(scale=1):
@@ -86,7 +89,8 @@ def draw(scale=1):
             points.append(mill(x, y) or land(x, y) or sky(x, y))
         return tuple(round(255 * min(max(sum(channel) / 9, 0), 1)) for channel in zip(*points))
 
-    return [[pixel(column, row) for column in range(WIDTH * scale)] for row in range(HEIGHT * scale)]
+    return [[pixel(column, row) for column in range(WIDTH * scale)]
+            for row in range(HEIGHT * scale)]
 
 
 def oval(column, row):
@@ -112,7 +116,8 @@ def chosen_palette(picture, count):
         widest = max(range(3), key=lambda channel: width(box, channel))
         box.sort(key=lambda pixel: pixel[widest])
         boxes += [(spread(half), half) for half in (box[:len(box) // 2], box[len(box) // 2:])]
-    return sorted((tuple(round(sum(channel) / len(box)) for channel in zip(*box)) for _, box in boxes), key=sum)
+    return sorted((tuple(round(sum(channel) / len(box)) for channel in zip(*box)) for _,
+                   box in boxes), key=sum)
 
 
 def indexed(picture, palette, dither):
@@ -124,7 +129,9 @@ def indexed(picture, palette, dither):
         for x, color in enumerate(row):
             wanted = tuple(color)
             if wanted not in nearest:
-                nearest[wanted] = min(range(len(palette)), key=lambda i: sum((a - b) ** 2 for a, b in zip(wanted, palette[i])))
+                nearest[wanted] = min(range(len(palette)),
+                                      key=lambda i: sum((a - b) ** 2 for a,
+                                                        b in zip(wanted, palette[i])))
             result[y][x] = nearest[wanted]
             if not dither:
                 continue
@@ -141,7 +148,8 @@ def packed(indexes, bits):
     """Indexes as bytes, the first pixel in the highest bits."""
     per_byte = 8 // bits
     indexes = indexes + [0] * (-len(indexes) % per_byte)
-    return bytes(sum(index << (8 - bits * (i + 1)) for i, index in enumerate(indexes[at:at + per_byte]))
+    return bytes(sum(index << (8 - bits * (i + 1)) for i,
+                     index in enumerate(indexes[at:at + per_byte]))
                  for at in range(0, len(indexes), per_byte))
 
 
@@ -157,7 +165,8 @@ def blue_first(row):
 def high_color(row, green_bits):
     """16-bit pixels: 5 bits of red and blue with 5 or 6 of green between them."""
     green_most = 2 ** green_bits - 1
-    return b"".join(struct.pack("<H", r * 31 // 255 << (5 + green_bits) | g * green_most // 255 << 5 | b * 31 // 255)
+    return b"".join(struct.pack("<H",
+                                r * 31 // 255 << (5 + green_bits) | g * green_most // 255 << 5 | b * 31 // 255)
                     for r, g, b in row)
 
 
@@ -166,7 +175,8 @@ def bmp(bits, pixels, palette=(), compression=0, masks=b"", height=HEIGHT):
     table = b"".join(bytes((b, g, r, 0)) for r, g, b in palette)
     offset = 54 + len(masks) + len(table)
     return (struct.pack("<2sIII", b"BM", offset + len(pixels), 0, offset)
-            + struct.pack("<IiiHHIIiiII", 40, WIDTH, height, 1, bits, compression, len(pixels), 2835, 2835, len(palette), 0)
+            + struct.pack("<IiiHHIIiiII", 40, WIDTH, height, 1, bits, compression, len(pixels),
+                          2835, 2835, len(palette), 0)
             + masks + table + pixels)
 
 
@@ -229,7 +239,8 @@ def pcx(bits, rows, palette=()):
     """`rows` holds for each row its planes as byte strings; they are made an even number of bytes long."""
     rows = [[plane + bytes(len(plane) % 2) for plane in row] for row in rows]
     first = b"".join(bytes(color) for color in palette[:16]).ljust(48, b"\0")
-    header = struct.pack("<4B6H48sBBHH58x", 10, 5, 1, bits, 0, 0, WIDTH - 1, HEIGHT - 1, 72, 72, first, 0, len(rows[0]),
+    header = struct.pack("<4B6H48sBBHH58x", 10, 5, 1, bits, 0, 0, WIDTH - 1, HEIGHT - 1, 72, 72,
+                         first, 0, len(rows[0]),
                          len(rows[0][0]), 1)
     trailer = b"\x0c" + b"".join(bytes(color) for color in palette) if len(palette) == 256 else b""
     return header + b"".join(pcx_runs(plane) for row in rows for plane in row) + trailer
@@ -239,7 +250,8 @@ def pcx(bits, rows, palette=()):
 
 def fits(rows):
     """`rows` are bytes of gray from top to bottom."""
-    cards = ("SIMPLE  = T", "BITPIX  = 8", "NAXIS   = 2", f"NAXIS1  = {len(rows[0])}", f"NAXIS2  = {len(rows)}", "END")
+    cards = ("SIMPLE  = T", "BITPIX  = 8", "NAXIS   = 2", f"NAXIS1  = {len(rows[0])}",
+             f"NAXIS2  = {len(rows)}", "END")
     header = "".join(keyword.ljust(10) + value.rjust(20) + " " * 50
                      for keyword, value in ((card[:9], card[9:].strip()) for card in cards))
     data = b"".join(rows)
@@ -287,14 +299,16 @@ def main():
     folder = Path(sys.argv[1]) if len(sys.argv) > 1 else Path(__file__).resolve().parent
     picture = draw()
     black_white = [(0, 0, 0), (255, 255, 255)]
-    gray = [[(1.5 * (0.3 * r + 0.59 * g + 0.11 * b) - 80,) * 3 for r, g, b in row] for row in picture]
+    gray = [[(1.5 * (0.3 * r + 0.59 * g + 0.11 * b) - 80,) * 3 for r, g, b in row]
+            for row in picture]
     mono = indexed(gray, black_white, dither=True)
     colors16, colors64, colors256 = (chosen_palette(picture, count) for count in (16, 64, 256))
     picture16 = indexed(picture, colors16, dither=True)
     picture256 = indexed(picture, colors256, dither=True)
     flat16 = indexed(picture, colors16, dither=False)
     flat64 = indexed(picture, colors64, dither=False)
-    with_alpha = [[(b, g, r, oval(x, y)) for x, (r, g, b) in enumerate(row)] for y, row in enumerate(picture)]
+    with_alpha = [[(b, g, r, oval(x, y)) for x, (r, g, b) in enumerate(row)] for y,
+                  row in enumerate(picture)]
     pcx256 = pcx(8, [[bytes(row)] for row in picture256], colors256)
 
     files = {
@@ -306,18 +320,22 @@ def main():
         "bmp-rle4.bmp": bmp(4, bmp_runs(flat16, 4), colors16, compression=2),
         "bmp-rle8.bmp": bmp(8, bmp_runs(flat64, 8), colors64 + [(0, 0, 0)] * 192, compression=1),
         "bmp-high-color-555.bmp": bmp(16, bmp_rows(picture, lambda row: high_color(row, 5))),
-        "bmp-high-color-565.bmp": bmp(16, bmp_rows(picture, lambda row: high_color(row, 6)), compression=3,
+        "bmp-high-color-565.bmp": bmp(16, bmp_rows(picture, lambda row: high_color(row, 6)),
+                                      compression=3,
                                    masks=struct.pack("<III", 0xF800, 0x07E0, 0x001F)),
         "bmp-os2.bmp": os2_bmp(8, bmp_rows(picture256, bytes), colors256),
         "bmp-top-down.bmp": bmp(8, bmp_rows(picture256[::-1], bytes), colors256, height=-HEIGHT),
         "pcx-mono.pcx": pcx(1, [[packed(row, 1)] for row in mono], black_white),
-        "pcx-16-colors.pcx": pcx(1, [[packed([index >> plane & 1 for index in row], 1) for plane in range(4)]
+        "pcx-16-colors.pcx": pcx(1, [[packed([index >> plane & 1 for index in row], 1)
+                                      for plane in range(4)]
                                   for row in picture16], colors16),
         "pcx-16-colors-packed.pcx": pcx(4, [[packed(row, 4)] for row in picture16], colors16),
         "pcx-256-colors.pcx": pcx256,
-        "pcx-true-color.pcx": pcx(8, [[bytes(pixel[channel] for pixel in row) for channel in range(3)] for row in picture]),
+        "pcx-true-color.pcx": pcx(8, [[bytes(pixel[channel] for pixel in row)
+                                       for channel in range(3)] for row in picture]),
         "damaged.pcx": pcx256[:len(pcx256) // 2],
-        "fits-gray.fits": fits([bytes((30 * r + 59 * g + 11 * b) // 100 for r, g, b in row) for row in picture]),
+        "fits-gray.fits": fits([bytes((30 * r + 59 * g + 11 * b) // 100 for r, g, b in row)
+                                for row in picture]),
         "xbm-mono.xbm": xbm([row[3:147] for row in mono], "windmill"),
         "mac-mono.mac": mac_paint(mono, "Windmill"),
     }

@@ -133,8 +133,9 @@ TEST_F(Run, AnOutputThatFailedLeavesItsNameToTheNext) {
     job.formatIndex = FindFormatByName("x.jpg");
     ASSERT_EQ(RunBatch(files, {.jobs = jobs}, job), Status::Ok);
     EXPECT_EQ(job.progress.Lines()[0].item.status, Status::UnsuitableImage);
-    EXPECT_THAT(job.progress.Lines()[0].text,
-                testing::EndsWith("Unsuitable image. The format holds at most 65500 x 65500 pixels."));
+    EXPECT_THAT(
+        job.progress.Lines()[0].text,
+        testing::EndsWith("Unsuitable image. The format holds at most 65500 x 65500 pixels."));
     EXPECT_EQ(job.progress.Lines()[1].text, In("two/a.bmp") + " -> " + In("out/a.jpg"));
   }
 }

@@ -1,6 +1,6 @@
 #!/bin/bash
-# Completes command lines with the script that the program prints for bash; zsh runs the same one. The script for fish is read
-# by fish where there is one.
+# Completes command lines with the script that the program prints for bash; zsh runs the same one.
+# The script for fish is read by fish where there is one.
 set -u
 faults=0
 source <("$FOTOMILL" completion bash) || exit 1

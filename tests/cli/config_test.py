@@ -13,7 +13,8 @@ faults = []
 
 
 def run(folder, *arguments):
-    result = subprocess.run([PROGRAM, "--data", str(folder), *arguments], stdin=subprocess.DEVNULL, capture_output=True)
+    result = subprocess.run([PROGRAM, "--data", str(folder), *arguments], stdin=subprocess.DEVNULL,
+                            capture_output=True)
     return result.returncode, result.stdout, result.stderr.decode("utf-8", "replace")
 
 
@@ -22,10 +23,12 @@ def check(what, found, expected):
         faults.append(f"{what}: expected {expected!r}, found {found!r}")
 
 
-# (arguments after "config", exit status, standard output, part of standard error, file afterwards); a file of None: as before
+# (arguments after "config", exit status, standard output, part of standard error, file afterwards);
+# a file of None: as before
 STEPS = [
     (["get", "JpegCompression"], 0, b"75\n", "", None),
-    (["set", "JpegCompression", "80"], 0, b"JpegCompression: 75 -> 80\n", "", b"[Fotomill]\nJpegCompression=80\n"),
+    (["set", "JpegCompression", "80"], 0, b"JpegCompression: 75 -> 80\n", "",
+     b"[Fotomill]\nJpegCompression=80\n"),
     (["set", "--dry-run", "JpegCompression", "90"], 0, b"JpegCompression: 80 -> 90\n", "", None),
     (["get", "JpegCompression", "FXBrightness"], 0, b"80\n0\n", "", None),
     (["list", "--changed"], 0, b"JpegCompression=80\n", "", None),
@@ -38,7 +41,8 @@ STEPS = [
     (["set", "FindSimilarDistance", "1"], 2, b"", "FindSimlarDistance", None),
     (["get", "jpegcompression"], 2, b"", "JpegCompression", None),
     (["unset", "-n", "PrefixCrop"], 0, b"PrefixCrop: Cut out  -> Cropped_ \n", "", None),
-    (["unset", "PrefixCrop"], 0, b"PrefixCrop: Cut out  -> Cropped_ \n", "", b"[Fotomill]\nJpegCompression=80\n"),
+    (["unset", "PrefixCrop"], 0, b"PrefixCrop: Cut out  -> Cropped_ \n", "",
+     b"[Fotomill]\nJpegCompression=80\n"),
     (["unset", "PrefixCrop"], 0, b"PrefixCrop: Cropped_  -> Cropped_ \n", "", None),
     (["set", "JpegCompression"], 2, b"", "", None),
 ]
@@ -60,9 +64,11 @@ def test_steps(folder):
 
 def test_set_wins_for_one_run(folder):
     (folder / NAME).write_bytes(b"[Fotomill]\nJpegCompression=80\n")
-    check("--set", run(folder, "--set", "JpegCompression=5", "config", "get", "JpegCompression")[:2], (0, b"5\n"))
+    check("--set", run(folder, "--set", "JpegCompression=5", "config", "get",
+                       "JpegCompression")[:2], (0, b"5\n"))
     check("file", run(folder, "config", "get", "JpegCompression")[1], b"80\n")
-    for wrong, part in [("JpegComp=5", "JpegCompression"), ("JpegCompression", "KEY=VALUE"), ("JpegCompression=x", "number"),
+    for wrong, part in [("JpegComp=5", "JpegCompression"), ("JpegCompression", "KEY=VALUE"),
+                        ("JpegCompression=x", "number"),
                         ("=1", "nearest")]:
         status, out, error = run(folder, "--set", wrong, "config", "list")
         check(f"--set {wrong}", (status, out, part in error), (2, b"", True))
@@ -72,17 +78,22 @@ def test_json(folder):
     keys = json.loads(run(folder, "config", "list", "--json")[1])
     check("fields", {tuple(key) for key in keys}, {("name", "type", "value", "default")})
     by_name = {key["name"]: key for key in keys}
-    check("first and last", (keys[0]["name"], keys[-1]["name"]), ("AllowDestinationOverrides", "WriteOS2Bitmaps"))
+    check("first and last", (keys[0]["name"], keys[-1]["name"]),
+          ("AllowDestinationOverrides", "WriteOS2Bitmaps"))
     check("levels", by_name["TextCharacterLevels"]["value"], "\u00ff.:-+|=%o#&XOB@")
-    check("number", by_name["JpegCompression"], {"name": "JpegCompression", "type": 0x44, "value": 75, "default": 75})
+    check("number", by_name["JpegCompression"], {"name": "JpegCompression", "type": 0x44,
+                                                 "value": 75, "default": 75})
     text = run(folder, "config", "list")[1].split(b"\n")
-    check("same rows as text", [line.split(b"=")[0].decode() for line in text[:-1]], [key["name"] for key in keys])
+    check("same rows as text", [line.split(b"=")[0].decode() for line in text[:-1]],
+          [key["name"] for key in keys])
 
 
 def test_many_at_once(folder):
-    names = [key["name"] for key in json.loads(run(folder, "config", "list", "--json")[1]) if key["type"] == 4][:40]
+    names = [key["name"] for key in json.loads(run(folder, "config", "list", "--json")[1])
+             if key["type"] == 4][:40]
     command = [PROGRAM, "--data", str(folder), "config", "set"]
-    for process in [subprocess.Popen([*command, name, "77"], stdout=subprocess.DEVNULL) for name in names]:
+    for process in [subprocess.Popen([*command, name, "77"], stdout=subprocess.DEVNULL)
+                    for name in names]:
         check("exit status", process.wait(), 0)
     lines = (folder / NAME).read_text().split("\n")
     check("every process's key", sorted(lines[1:-1]), sorted(f"{name}=77" for name in names))
@@ -93,7 +104,8 @@ def test_unreadable(folder):
     os.mkdir(folder / NAME)
     status, out, error = run(folder, "config", "set", "JpegCompression", "80")
     check("set", (status, out), (1, b""))
-    check("message", error, f"{folder / NAME}: The configuration file cannot be read; left unchanged.\n")
+    check("message", error,
+          f"{folder / NAME}: The configuration file cannot be read; left unchanged.\n")
     check("get", run(folder, "config", "get", "JpegCompression")[:2], (0, b"75\n"))
 
 

@@ -237,7 +237,8 @@ TEST_F(FileCommands, OpensFilesWhoseNamesLie) {
   EXPECT_EQ(RunCommand({"convert", In("photo.png"), "--to", "bmp"}).status, 0);
   EXPECT_EQ(ReadBytes(In("photo.bmp")).size(), BitmapFile(5, 3, 24).size());
   EXPECT_EQ(RunCommand({"thumbs", "draw", In("photo.png"), "--side", "4", "--out", In("t.bmp")}).status, 0);
-  const CommandResult off = RunCommand({"--set", "IdentifyMysteryViewFiles=0", "info", In("photo.png")});
+  const CommandResult off =
+      RunCommand({"--set", "IdentifyMysteryViewFiles=0", "info", In("photo.png")});
   EXPECT_EQ(off.status, 1);
   EXPECT_THAT(off.err, HasSubstr("Damaged file. It looks like JPEG."));
 }
@@ -247,13 +248,16 @@ TEST_F(FileCommands, MatchLooksIntoFiles) {
   fs::copy(In("made.jpg"), In("made.scr"));
   fs::copy(In("made.jpg"), In("made"));
   WriteText(In("photo.avif"), std::string("\0\0\0\x1c", 4) + "ftypavif....");
-  const CommandResult text = RunCommand({"match", "--contents", In("made.scr"), In("made"), In("a.bmp"), In("photo.avif"), In("none.bmp")});
+  const CommandResult text = RunCommand({"match", "--contents", In("made.scr"), In("made"),
+                                         In("a.bmp"), In("photo.avif"), In("none.bmp")});
   EXPECT_EQ(text.status, 1);
-  EXPECT_EQ(text.out, In("made.scr") + ": JPG, (JPG) Jpeg, by its contents; its name selects SCR\n" +
-                          In("made") + ": JPG, (JPG) Jpeg, by its contents; its name selects no format\n" +
-                          In("a.bmp") + ": BMP, (BMP) Windows bitmap, by its extension\n");
+  EXPECT_EQ(text.out,
+            In("made.scr") + ": JPG, (JPG) Jpeg, by its contents; its name selects SCR\n" +
+                In("made") + ": JPG, (JPG) Jpeg, by its contents; its name selects no format\n" +
+                In("a.bmp") + ": BMP, (BMP) Windows bitmap, by its extension\n");
   EXPECT_THAT(text.err, HasSubstr("It looks like AVIF."));
-  const json array = json::parse(RunCommand({"match", "--contents", "--json", In("made.scr"), In("photo.avif")}).out);
+  const json array = json::parse(
+      RunCommand({"match", "--contents", "--json", In("made.scr"), In("photo.avif")}).out);
   EXPECT_EQ(array[0]["extension"], "SCR");
   EXPECT_EQ(array[0]["contentsExtension"], "JPG");
   EXPECT_EQ(array[0]["contentsIndex"], 15);

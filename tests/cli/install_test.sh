@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
-# What an installed tree holds and that it works on its own: programs, man pages, completions, plug-ins; and that uninstalling
-# takes exactly that away again.
+# What an installed tree holds and that it works on its own: programs, man pages, completions,
+# plug-ins; and that uninstalling takes exactly that away again.
 set -u
 project=$(cd "$(dirname "${BASH_SOURCE[0]}")/../.." && pwd -P)
 build=${FOTOMILL%/fotomill}
@@ -27,20 +27,25 @@ for component in "${components[@]}"; do
 done
 
 # The program alone, without the tree it was built in.
-Expect "German is found" "*Befehle:*" "$(LANGUAGE=de LC_ALL=C.UTF-8 "$prefix/bin/fotomill" --lang de help)"
+Expect "German is found" "*Befehle:*" \
+  "$(LANGUAGE=de LC_ALL=C.UTF-8 "$prefix/bin/fotomill" --lang de help)"
 printf 'P6\n2 1\n255\n\1\2\3\4\5\6' >"$work/a.ppm"
-Expect "the plug-in is found" "0" "$("$prefix/bin/fotomill" convert "$work/a.ppm" --to bmp >/dev/null 2>&1; echo $?)"
+Expect "the plug-in is found" "0" \
+  "$("$prefix/bin/fotomill" convert "$work/a.ppm" --to bmp >/dev/null 2>&1; echo $?)"
 Expect "what it wrote" "2x1" "$("$prefix/bin/fotomill" info --json "$work/a.bmp" |
   python3 -c 'import json,sys; p=json.load(sys.stdin)[0]; print("%dx%d" % (p["width"], p["height"]))')"
 
 # Every command has its man page, and groff has nothing to say about any.
-commands=$("$prefix/bin/fotomill" help | sed -nE '/^Commands/,/^$/ s/^  ([a-z -]+[a-z])  .*/\1/p' | grep -vx help | tr ' ' '-' | sort)
-Expect "a page a command" "$commands" "$(ls "$prefix/share/man/man1" | sed -nE 's/^fotomill-(.*)\.1$/\1/p' | sort)"
+commands=$("$prefix/bin/fotomill" help | sed -nE '/^Commands/,/^$/ s/^  ([a-z -]+[a-z])  .*/\1/p' |
+  grep -vx help | tr ' ' '-' | sort)
+Expect "a page a command" "$commands" \
+  "$(ls "$prefix/share/man/man1" | sed -nE 's/^fotomill-(.*)\.1$/\1/p' | sort)"
 Expect "the main page" "*.SH \"COMMANDS\"*convert*" "$(<"$prefix/share/man/man1/fotomill.1")"
 if command -v groff >/dev/null; then
   Expect "pages are clean" "" "$(groff -man -Tutf8 -ww -z "$prefix"/share/man/man1/*.1 2>&1)"
 fi
-for file in bash-completion/completions/fotomill zsh/site-functions/_fotomill fish/vendor_completions.d/fotomill.fish; do
+for file in bash-completion/completions/fotomill zsh/site-functions/_fotomill \
+  fish/vendor_completions.d/fotomill.fish; do
   Expect "$file" "*convert*" "$(<"$prefix/share/$file")"
 done
 
@@ -50,9 +55,11 @@ if [[ -x $prefix/bin/fotomill-desktop ]]; then
     Expect "$file" "yes" "$([[ -s $prefix/share/$file ]] && echo yes)"
   done
   ! command -v desktop-file-validate >/dev/null ||
-    Expect "desktop entry" "" "$(desktop-file-validate "$prefix/share/applications/fotomill-desktop.desktop")"
+    Expect "desktop entry" "" \
+      "$(desktop-file-validate "$prefix/share/applications/fotomill-desktop.desktop")"
   ! command -v appstreamcli >/dev/null ||
-    Expect "AppStream" "0" "$(appstreamcli validate --no-net "$prefix/share/metainfo/fotomill-desktop.metainfo.xml" >"$work/log" 2>&1; echo $?)"
+    Expect "AppStream" "0" \
+      "$(appstreamcli validate --no-net "$prefix/share/metainfo/fotomill-desktop.metainfo.xml" >"$work/log" 2>&1; echo $?)"
 fi
 
 # Uninstalling: what is ours goes, what is not stays.
@@ -66,5 +73,6 @@ echo "$prefix/../outside" >>"$prefix/share/fotomill/installed-files"
 "$project/packaging/install" uninstall --prefix "$prefix" 2>/dev/null
 Expect "uninstalled" "share/man/man1/other.1" "$(cd "$prefix" && find . -type f -printf '%P\n')"
 Expect "files outside stay" "yes" "$([[ -f $work/outside ]] && echo yes)"
-Expect "twice" "1" "$("$project/packaging/install" uninstall --prefix "$prefix" 2>/dev/null; echo $?)"
+Expect "twice" "1" \
+  "$("$project/packaging/install" uninstall --prefix "$prefix" 2>/dev/null; echo $?)"
 exit $((failures > 0))

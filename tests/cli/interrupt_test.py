@@ -1,6 +1,6 @@
 #!/usr/bin/env python3
-"""A conversion that is asked to end stops between two files, leaves whole files only, and says so by its exit status; on a
-terminal it asks, shows how far it is, and can be ended while it asks."""
+"""A conversion that is asked to end stops between two files, leaves whole files only, and says so
+by its exit status; on a terminal it asks, shows how far it is, and can be ended while it asks."""
 import json
 import os
 import pty
@@ -27,14 +27,16 @@ def bitmap(width, height):
     stride = (width * 3 + 3) // 4 * 4
     size = stride * height
     return (b"BM" + struct.pack("<IHHI", 54 + size, 0, 0, 54) +
-            struct.pack("<IiiHHIIiiII", 40, width, height, 1, 24, 0, size, 0, 0, 0, 0) + (bytes(range(256)) * (size // 256 + 1))[:size])
+            struct.pack("<IiiHHIIiiII", 40, width, height, 1, 24, 0, size, 0, 0, 0,
+                        0) + (bytes(range(256)) * (size // 256 + 1))[:size])
 
 
 def signalled(folder, number, jobs):
     """Asks a run to end after its first result; its exit status and its results."""
     out = folder / f"out{number}{jobs}"
     with open(folder / "messages", "w+", encoding="utf-8") as log:
-        run = subprocess.Popen([FOTOMILL, "convert", folder / "in", "--to", "bmp", "--dest", out, "--json", "-j", str(jobs)],
+        run = subprocess.Popen([FOTOMILL, "convert", folder / "in", "--to", "bmp", "--dest", out,
+                                "--json", "-j", str(jobs)],
                                stdout=subprocess.PIPE, stderr=log, text=True)
         begun = run.stdout.readline() + run.stdout.readline()
         run.send_signal(number)
@@ -46,9 +48,13 @@ def signalled(folder, number, jobs):
     expect(f"{name}: exit status", run.returncode == 128 + number, run.returncode)
     expect(f"{name}: it stopped", 0 < len(results) < COUNT, len(results))
     written = sorted(path.name for path in out.iterdir())
-    expect(f"{name}: what is there was reported", written == sorted(Path(row["destination"]).name for row in results), written[:5])
-    expect(f"{name}: outputs are whole", all((out / file).stat().st_size == (folder / "in" / file).stat().st_size for file in written))
-    expect(f"{name}: count line", f"{len(results)} files were processed." in messages or len(results) == 1, messages)
+    reported = sorted(Path(row["destination"]).name for row in results)
+    expect(f"{name}: what is there was reported", written == reported, written[:5])
+    expect(f"{name}: outputs are whole",
+           all((out / file).stat().st_size == (folder / "in" / file).stat().st_size
+               for file in written))
+    expect(f"{name}: count line", f"{len(results)} files were processed." in messages
+           or len(results) == 1, messages)
 
 
 class Terminal:
@@ -97,8 +103,10 @@ def terminal(folder):
         run.until("for the rest.")
         run.type(answer)
         expect(f"answer {answer!r}", run.end() == status, run.seen)
-        expect(f"answer {answer!r}: the name", name is None or (out.parent / name).exists(), run.seen)
-    expect("names on the terminal", sorted(path.name for path in out.parent.iterdir()) == ["one.pcx", "other.pcx"])
+        expect(f"answer {answer!r}: the name", name is None or (out.parent / name).exists(),
+               run.seen)
+    expect("names on the terminal", sorted(path.name
+                                           for path in out.parent.iterdir()) == ["one.pcx", "other.pcx"])
 
     run = Terminal("convert", folder / "in", "--to", "gif", "--reduce", "--dest", out.parent)
     run.until(" left")
@@ -112,10 +120,12 @@ def closed_streams(folder):
     small.mkdir()
     for i in range(20):
         (small / f"s{i}.bmp").write_bytes(bitmap(900, 900))
-    (small / "list").write_text("".join(f"{small}/{name}\n" for i in range(20) for name in (f"s{i}.bmp", f"missing{i}.bmp")))
+    (small / "list").write_text("".join(f"{small}/{name}\n" for i in range(20)
+                                        for name in (f"s{i}.bmp", f"missing{i}.bmp")))
     for stream in (0, 1, 2):
         out = folder / f"closed{stream}"
-        subprocess.run([FOTOMILL, "convert", "--files-from", small / "list", "--to", "bmp", "--dest", out, "-j", "3"],
+        subprocess.run([FOTOMILL, "convert", "--files-from", small / "list", "--to", "bmp",
+                        "--dest", out, "-j", "3"],
                        preexec_fn=lambda: os.close(stream), close_fds=False, capture_output=False,
                        stdin=None, stdout=None if stream == 1 else subprocess.DEVNULL,
                        stderr=None if stream == 2 else subprocess.DEVNULL, check=False, timeout=60)

@@ -30,8 +30,10 @@ def check(good, what):
 def bitmap(width, height, seed=0):
     """A BMP of 24 bits whose pixels all differ."""
     row = (width * 3 + 3) // 4 * 4
-    pixels = b"".join(bytes((x * 7 + y * 13 + seed) % 256 for x in range(row)) for y in range(height))
-    return struct.pack("<2sIHHIIiiHHIIiiII", b"BM", 54 + len(pixels), 0, 0, 54, 40, width, height, 1, 24, 0, len(pixels), 0, 0, 0, 0) + pixels
+    pixels = b"".join(bytes((x * 7 + y * 13 + seed) % 256 for x in range(row))
+                      for y in range(height))
+    return struct.pack("<2sIHHIIiiHHIIiiII", b"BM", 54 + len(pixels), 0, 0, 54, 40, width, height,
+                       1, 24, 0, len(pixels), 0, 0, 0, 0) + pixels
 
 
 class Place:
@@ -62,8 +64,10 @@ class Place:
 
     def start(self, *arguments):
         step = {"user": NOBODY, "group": NOBODY, "extra_groups": []} if ROOT else {}
-        return subprocess.Popen([PROGRAM, *arguments], cwd=self.path, stdout=subprocess.PIPE, stderr=subprocess.PIPE, text=True,
-                                stdin=subprocess.DEVNULL, env={**os.environ, "FOTOMILL_DATA": str(self.data)}, **step)
+        return subprocess.Popen([PROGRAM, *arguments], cwd=self.path, stdout=subprocess.PIPE,
+                                stderr=subprocess.PIPE, text=True,
+                                stdin=subprocess.DEVNULL,
+                                env={**os.environ, "FOTOMILL_DATA": str(self.data)}, **step)
 
     def run(self, *arguments, timeout=60):
         process = self.start(*arguments)
@@ -76,12 +80,15 @@ def folders_that_one_may_not_enter():
         place.file("a.bmp", bitmap(3, 2))
         place.file("locked/x", b"")
         (place.path / "locked").chmod(0)
-        for arguments in (["convert", "a.bmp", "-t", "pcx", "-d", "locked"], ["turn", "a.bmp", "--rotate", "180", "-d", "locked"],
-                          ["convert", "a.bmp", "-t", "pcx", "-d", "locked/sub"], ["contact-sheet", "a.bmp", "-t", "pcx", "-d", "locked"],
+        for arguments in (["convert", "a.bmp", "-t", "pcx", "-d", "locked"],
+                          ["turn", "a.bmp", "--rotate", "180", "-d", "locked"],
+                          ["convert", "a.bmp", "-t", "pcx", "-d", "locked/sub"],
+                          ["contact-sheet", "a.bmp", "-t", "pcx", "-d", "locked"],
                           ["convert", "a.bmp", "-t", "pcx", "-d", "locked", "--dry-run"]):
             begin = time.monotonic()
             status, _, err = place.run(*arguments)
-            check(status == 1 and "Permission denied." in err and time.monotonic() - begin < 20, f"{arguments}: {status} {err}")
+            check(status == 1 and "Permission denied." in err and time.monotonic() - begin < 20,
+                  f"{arguments}: {status} {err}")
 
 
 def reasons():
@@ -94,13 +101,15 @@ def reasons():
         secret.chmod(0o644)
         place.file("shut/b.bmp", bitmap(3, 2))
         (place.path / "shut").chmod(0o555)
-        for arguments in (["convert", "a.bmp", "-t", "png", "-d", "shut"], ["turn", "shut/b.bmp", "--rotate", "180", "--in-place"],
+        for arguments in (["convert", "a.bmp", "-t", "png", "-d", "shut"],
+                          ["turn", "shut/b.bmp", "--rotate", "180", "--in-place"],
                           ["rename", "shut/b.bmp"], ["thumbs", "make", "shut/b.bmp"]):
             status, _, err = place.run(*arguments)
             check(status == 1 and "Permission denied." in err, f"{arguments}: {status} {err}")
         place.data.chmod(0o555)
         status, _, err = place.run("config", "set", "WebPQualityFactor", "50")
-        check(status == 1 and (not ROOT or "Permission denied." in err), f"config set: {status} {err}")
+        check(status == 1 and (not ROOT or "Permission denied." in err),
+              f"config set: {status} {err}")
 
 
 def turns_at_once():
@@ -110,15 +119,18 @@ def turns_at_once():
         for i in range(60):
             name = f"p{i:02}.bmp"
             place.file(name, bitmap(40 + i, 30, i))
-            check(place.run("turn", name, "--rotate", "180", "-d", "expected")[0] == 0, "the expected picture")
+            check(place.run("turn", name, "--rotate", "180", "-d", "expected")[0] == 0,
+                  "the expected picture")
             expected[name] = (place.path / "expected" / name).read_bytes()
         names = sorted(expected)  # with one thread each, the runs go side by side
-        runs = [place.start("turn", *names, "--rotate", "right", "--in-place", "-j", "1") for _ in range(2)]
+        runs = [place.start("turn", *names, "--rotate", "right", "--in-place", "-j", "1")
+                for _ in range(2)]
         for process in runs:
             _, err = process.communicate(timeout=120)
             check(process.returncode == 0, f"turn: {err}")
         for name in names:
-            check((place.path / name).read_bytes() == expected[name], f"{name} was not turned twice")
+            check((place.path / name).read_bytes() == expected[name],
+                  f"{name} was not turned twice")
 
 
 def replaced_meanwhile():
@@ -134,7 +146,8 @@ def replaced_meanwhile():
             process.communicate(timeout=60)
             now = path.read_bytes()
             check(len(now) < 200, f"what was saved after {delay * 20} ms is lost")
-        check(not [name for name in os.listdir(place.path) if name.startswith(".fmw")], "working files are left")
+        check(not [name for name in os.listdir(place.path) if name.startswith(".fmw")],
+              "working files are left")
 
 
 def attributes():
@@ -148,14 +161,16 @@ def attributes():
                           ["convert", "a.bmp", "-t", "bmp", "--overwrite", "replace"]):
             status, _, err = place.run(*arguments)
             check(status == 0, f"{arguments}: {err}")
-            check(os.listxattr(path) and os.getxattr(path, "user.xdg.tags") == b"holiday", f"{arguments} dropped a tag")
+            check(os.listxattr(path) and os.getxattr(path, "user.xdg.tags") == b"holiday",
+                  f"{arguments} dropped a tag")
         if not ROOT:
             return
         os.chown(path, 1, 1)
         path.chmod(0o666)
         os.chown(place.path, NOBODY, NOBODY)
         status, _, err = place.run("turn", "a.bmp", "--rotate", "180", "--in-place")
-        check(status == 0 and "Not kept from the replaced file: group, owner." in err, f"owner: {status} {err}")
+        check(status == 0 and "Not kept from the replaced file: group, owner." in err,
+              f"owner: {status} {err}")
 
 
 def renames_killed():
@@ -170,7 +185,8 @@ def renames_killed():
             process.communicate()
             status, _, err = place.run("rename", "--undo")
             there = sorted(p.name for p in (place.path / f"in{attempt}").iterdir())
-            check(status == 0 and there == sorted(n.split("/")[1] for n in names), f"undo after a kill: {status} {err[:300]}")
+            check(status == 0 and there == sorted(n.split("/")[1] for n in names),
+                  f"undo after a kill: {status} {err[:300]}")
 
 
 def held_locks():
@@ -187,7 +203,8 @@ def held_locks():
             status, _, err = place.run("config", "set", "WebPQualityFactor", "71")
             took = time.monotonic() - begin
             check(status == 1 and 9 < took < 20, f"config set: status {status} after {took:.1f} s")
-            check("Waiting for" in err and f"process {os.getpid()}" in err and "It is locked by" in err, err)
+            check("Waiting for" in err and f"process {os.getpid()}" in err
+                  and "It is locked by" in err, err)
 
 
 def two_cleanings():
@@ -197,7 +214,8 @@ def two_cleanings():
         runs = [place.start("thumbs", "clean", "p") for _ in range(2)]
         for process in runs:
             _, err = process.communicate(timeout=60)
-            check(process.returncode == 0 and "could not be deleted" not in err, f"thumbs clean: {err[:300]}")
+            check(process.returncode == 0 and "could not be deleted" not in err,
+                  f"thumbs clean: {err[:300]}")
 
 
 def links_of_the_system():
@@ -205,7 +223,8 @@ def links_of_the_system():
         place.file("a.bmp", bitmap(4, 3))
         link = place.path / "stdout"
         link.symlink_to("/proc/self/fd/1")
-        status, _, err = place.run("convert", "a.bmp", "--out", "stdout", "-t", "png", "--overwrite", "replace")
+        status, _, err = place.run("convert", "a.bmp", "--out", "stdout", "-t", "png",
+                                   "--overwrite", "replace")
         check(status != 0 and link.is_symlink(), f"a link to an open file: {status} {err}")
 
 
@@ -221,7 +240,8 @@ def working_files_of_killed_runs():
 
 
 def main():
-    for case in (folders_that_one_may_not_enter, reasons, turns_at_once, replaced_meanwhile, attributes, renames_killed,
+    for case in (folders_that_one_may_not_enter, reasons, turns_at_once, replaced_meanwhile,
+                 attributes, renames_killed,
                  held_locks, two_cleanings, links_of_the_system, working_files_of_killed_runs):
         if len(sys.argv) > 1 and case.__name__ not in sys.argv[1:]:
             continue

@@ -9,7 +9,8 @@ from pathlib import Path
 
 
 def output(*arguments):
-    run = subprocess.run([os.environ["FOTOMILL"], *arguments], capture_output=True, text=True, check=True)
+    run = subprocess.run([os.environ["FOTOMILL"], *arguments], capture_output=True, text=True,
+                         check=True)
     return run.stdout
 
 
@@ -18,7 +19,8 @@ def table_rows(readme, first_heading):
     rows = []
     inside = False
     for line in readme.splitlines():
-        cells = [cell.strip() for cell in line.strip().strip("|").split("|")] if line.startswith("|") else []
+        cells = [cell.strip()
+                 for cell in line.strip().strip("|").split("|")] if line.startswith("|") else []
         if cells and cells[0] == first_heading:
             inside = True
         elif not cells:
@@ -31,15 +33,18 @@ def table_rows(readme, first_heading):
 def difference(what, promised, there):
     for name in sorted(set(promised) | set(there)):
         if promised.get(name) != there.get(name):
-            yield f"{what} {name}: README.md says {promised.get(name, 'nothing')}, the program {there.get(name, 'nothing')}"
+            said, known = promised.get(name, "nothing"), there.get(name, "nothing")
+            yield f"{what} {name}: README.md says {said}, the program {known}"
 
 
 def main():
     readme = (Path(__file__).resolve().parents[2] / "README.md").read_text(encoding="utf-8")
 
     commands = output("--help").split("Commands:")[1].split("\n\n")[0]
-    there = {name: "yes" for name in re.findall(r"^  ([a-z][a-z -]*?)  ", commands, re.MULTILINE) if name != "help"}
-    promised = {name: "yes" for cells in table_rows(readme, "command") for name in re.findall(r"`([^`]+)`", cells[0])}
+    there = {name: "yes" for name in re.findall(r"^  ([a-z][a-z -]*?)  ", commands, re.MULTILINE)
+             if name != "help"}
+    promised = {name: "yes" for cells in table_rows(readme, "command")
+                for name in re.findall(r"`([^`]+)`", cells[0])}
     faults = list(difference("command", promised, there))
 
     can = {True: "yes", False: "no"}

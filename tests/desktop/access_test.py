@@ -10,7 +10,8 @@ from pathlib import Path
 try:
     from gi.repository import Gio, GLib
 except ImportError:
-    if sys.executable != "/usr/bin/python3" and Path("/usr/bin/python3").exists():  # the system's bindings are for its own Python
+    # the system's bindings are for its own Python
+    if sys.executable != "/usr/bin/python3" and Path("/usr/bin/python3").exists():
         os.execv("/usr/bin/python3", ["/usr/bin/python3", *sys.argv])
     print("python3-gi is not installed: left out")
     sys.exit(77)
@@ -20,9 +21,11 @@ from driven_desktop import PATIENCE, Desktop, Failure, make_pictures, run
 ACCESSIBLE = "org.a11y.atspi.Accessible"
 # Bits of the states of the accessibility interface.
 ENABLED, FOCUSABLE, FOCUSED, SHOWING, MANAGES_DESCENDANTS = 8, 11, 12, 25, 31
-# Frames of what scrolls pass the focus on to what they hold; of radio buttons Tab meets the one that is chosen.
+# Frames of what scrolls pass the focus on to what they hold; of radio buttons Tab meets the one
+# that is chosen.
 PASSED_ON = {"scroll pane", "viewport"}
-NOT_BY_TAB = PASSED_ON | {"radio button", "menu", "menu item", "check menu item", "radio menu item", "icon"}
+NOT_BY_TAB = PASSED_ON | {"radio button", "menu", "menu item", "check menu item", "radio menu item",
+                          "icon"}
 
 
 class Heard:
@@ -58,21 +61,26 @@ class ReadDesktop(Desktop):
 
     def start(self):
         del self.environment["NO_AT_BRIDGE"]
-        self.bus = subprocess.Popen(["dbus-daemon", "--session", "--print-address=1", "--nofork", "--nopidfile"], env=self.environment,
+        self.bus = subprocess.Popen(["dbus-daemon", "--session", "--print-address=1", "--nofork",
+                                     "--nopidfile"], env=self.environment,
                                     stdout=subprocess.PIPE, stderr=subprocess.DEVNULL, text=True)
         self.environment["DBUS_SESSION_BUS_ADDRESS"] = address = self.bus.stdout.readline().strip()
-        flags = Gio.DBusConnectionFlags.AUTHENTICATION_CLIENT | Gio.DBusConnectionFlags.MESSAGE_BUS_CONNECTION
+        flags = (Gio.DBusConnectionFlags.AUTHENTICATION_CLIENT
+                 | Gio.DBusConnectionFlags.MESSAGE_BUS_CONNECTION)
         session = Gio.DBusConnection.new_for_address_sync(address, flags, None, None)
         try:
-            where, = session.call_sync("org.a11y.Bus", "/org/a11y/bus", "org.a11y.Bus", "GetAddress", None, None, 0, -1, None).unpack()
+            where, = session.call_sync("org.a11y.Bus", "/org/a11y/bus", "org.a11y.Bus",
+                                       "GetAddress", None, None, 0, -1, None).unpack()
         except GLib.Error:
             self.bus.terminate()
             print("at-spi2-core is not installed: left out")
             sys.exit(77)
         self.connection = Gio.DBusConnection.new_for_address_sync(where, flags, None, None)
         self.focused = []
-        self.connection.signal_subscribe(None, "org.a11y.atspi.Event.Object", "StateChanged", None, "focused", 0, self.on_focus)
-        self.call(("org.a11y.atspi.Registry", "/org/a11y/atspi/registry"), "org.a11y.atspi.Registry", "RegisterEvent",
+        self.connection.signal_subscribe(None, "org.a11y.atspi.Event.Object", "StateChanged", None,
+                                         "focused", 0, self.on_focus)
+        self.call(("org.a11y.atspi.Registry", "/org/a11y/atspi/registry"),
+                  "org.a11y.atspi.Registry", "RegisterEvent",
                   GLib.Variant("(s)", ("object:state-changed:focused",)))
         super().start()
 
@@ -86,11 +94,13 @@ class ReadDesktop(Desktop):
             self.focused.append((sender, path))
 
     def call(self, reference, interface, method, arguments=None):
-        answer = self.connection.call_sync(*reference, interface, method, arguments, None, 0, 20000, None).unpack()
+        answer = self.connection.call_sync(*reference, interface, method, arguments, None, 0, 20000,
+                                           None).unpack()
         return answer[0] if len(answer) == 1 else answer
 
     def property(self, reference, name):
-        return self.call(reference, "org.freedesktop.DBus.Properties", "Get", GLib.Variant("(ss)", (ACCESSIBLE, name)))
+        return self.call(reference, "org.freedesktop.DBus.Properties", "Get",
+                         GLib.Variant("(ss)", (ACCESSIBLE, name)))
 
     def window(self, title):
         """What is heard of the top window of a title."""
@@ -103,7 +113,8 @@ class ReadDesktop(Desktop):
         raise Failure(f"no window {title} is heard of")
 
     def takers(self, title):
-        return [heard for heard in self.window(title).below() if heard.has(FOCUSABLE) or heard.role == "combo box"]
+        return [heard for heard in self.window(title).below() if heard.has(FOCUSABLE)
+                or heard.role == "combo box"]
 
     def check(self, title, tab=True):
         """Every control of a window has a name, and Tab comes to each one that can be used."""
@@ -111,7 +122,8 @@ class ReadDesktop(Desktop):
         takers = self.takers(title)
         nameless = [str(heard) for heard in takers if not heard.name.strip()]
         if not takers or nameless:
-            raise Failure(f"{title}: of {[str(heard) for heard in takers]} these have no name: {nameless}")
+            known = [str(heard) for heard in takers]
+            raise Failure(f"{title}: of {known} these have no name: {nameless}")
         print(f"{title}: {len(takers)} controls")
         if not tab:
             return
@@ -133,10 +145,12 @@ class ReadDesktop(Desktop):
                 except GLib.Error:  # it has gone since
                     pass
             missed = [heard for heard in takers
-                      if heard.has(ENABLED) and heard.role not in NOT_BY_TAB and not {heard.reference, heard.name} & met]
+                      if heard.has(ENABLED) and heard.role not in NOT_BY_TAB
+                      and not {heard.reference, heard.name} & met]
 
 
-# Windows over the browser: the keys that open them, the log's line, the title. Without keys: words for the command finder.
+# Windows over the browser: the keys that open them, the log's line, the title. Without keys: words
+# for the command finder.
 WINDOWS = [
     ("ctrl+e", r"prompt destination", "Convert"),
     ("shift+F2", r"prompt sequential-rename", "Sequential Rename"),
@@ -174,7 +188,8 @@ def every_window_is_heard(folder):
             desktop.check(title)
             desktop.key("Escape")
         # The canvases say what they show.
-        for keys, place in (("Right", "b.png, 2 of 2, selected"), ("Left", "a.bmp, 1 of 2, selected")):
+        for keys, place in (("Right", "b.png, 2 of 2, selected"),
+                            ("Left", "a.bmp, 1 of 2, selected")):
             desktop.focus("Fotomill Professional")
             desktop.key(keys)
             desktop.wait(r"selected=1 .* focus=" + place.split(",")[0])
@@ -205,7 +220,8 @@ def batch_windows_are_heard(folder):
     pictures = folder / "pictures"
     make_pictures(pictures, ["a.bmp", "b.png"])
     (pictures / "a.gif").write_bytes(b"GIF89a and no more")
-    with ReadDesktop(folder, pictures, settings=["CloseProgressWhenDone=0", "DestForceSourceDir=1", "DefaultFileExtension=png"]) as desktop:
+    with ReadDesktop(folder, pictures, settings=["CloseProgressWhenDone=0", "DestForceSourceDir=1",
+                                                 "DefaultFileExtension=png"]) as desktop:
         desktop.wait(r"lines=3 .*listing=0")
         desktop.focus("Fotomill Professional")
         desktop.key("ctrl+a", "ctrl+e")

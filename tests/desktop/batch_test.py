@@ -28,7 +28,8 @@ def convert_and_collide(folder):
     (out / "one.png").write_bytes(b"old")
     (folder / "data").mkdir()
     (folder / "data/FMWDestinationHistory.txt").write_text(f"{out}\n")
-    with Desktop(folder, pictures, settings=["CloseProgressWhenDone=0", "OverwriteKeepBoth=0"]) as desktop:
+    with Desktop(folder, pictures, settings=["CloseProgressWhenDone=0",
+                                             "OverwriteKeepBoth=0"]) as desktop:
         desktop.wait(r"lines=2 .*missing=0 listing=0")
         start_convert(desktop)
         confirm(desktop)
@@ -75,7 +76,8 @@ def errors_stay_and_abort_stops(folder):
     for number in range(4000):
         os.link(pictures / "p.bmp", pictures / f"p{number}.bmp")
     (pictures / "a.gif").write_bytes(b"GIF89a and no more")
-    with Desktop(folder, pictures, settings=["DestForceSourceDir=1", "DefaultFileExtension=tif"]) as desktop:
+    with Desktop(folder, pictures, settings=["DestForceSourceDir=1",
+                                             "DefaultFileExtension=tif"]) as desktop:
         desktop.wait(r"lines=4002 .*listing=0")
         start_convert(desktop)
         confirm(desktop)

@@ -16,9 +16,11 @@ def register_programs(home, marker):
     (home / ".config").mkdir(exist_ok=True)
     (data / "mime").mkdir()
     (data / "mime/globs2").write_text("50:image/png:*.png\n")
-    for name, more in (("Another", ""), ("Console", "Terminal=true\n"), ("Marker", ""), ("Unwanted", "")):
+    for name, more in (("Another", ""), ("Console", "Terminal=true\n"), ("Marker", ""),
+                       ("Unwanted", "")):
         (data / f"applications/{name}.desktop").write_text(
-            f"[Desktop Entry]\nType=Application\nName={name}\nExec=touch {marker} %F\nMimeType=image/png;\n{more}")
+            f"[Desktop Entry]\nType=Application\nName={name}\nExec=touch {marker} %F\n"
+            f"MimeType=image/png;\n{more}")
     (data / "applications/mimeinfo.cache").write_text(
         "[MIME Cache]\nimage/png=Another.desktop;Console.desktop;Marker.desktop;Unwanted.desktop;\n")
     (home / ".config/mimeapps.list").write_text(
@@ -165,7 +167,8 @@ def compare(folder):
         desktop.key("ctrl+a")
         desktop.wait(r"selected=4")
         desktop.key("ctrl+shift+Return")
-        for pane in (r"1/4 status=0 .*a.bmp", r"2/4 status=0 .*b.png", r"3/4 status=0 .*c.jpg", r"4/4 status=3 .*d.gif"):
+        for pane in (r"1/4 status=0 .*a.bmp", r"2/4 status=0 .*b.png", r"3/4 status=0 .*c.jpg",
+                     r"4/4 status=3 .*d.gif"):
             desktop.wait("compare pane=" + pane)
         desktop.focus("Compare")
         # Joined panes zoom together, others alone.
@@ -218,7 +221,8 @@ def play_animation(folder):
         desktop.wait(rf"view-frame frame {(paused + 3) % 5 + 1} of 5, paused")
         desktop.key("space")
         desktop.wait(r"view-frame frame 1 of 5$")
-        # A slideshow waits until an animation that takes longer was shown once, and ends with the last picture.
+        # A slideshow waits until an animation that takes longer was shown once, and ends with the
+        # last picture.
         desktop.key("Escape")
         desktop.focus("Fotomill Professional")
         desktop.key("Home", "Return")
@@ -234,7 +238,8 @@ def play_animation(folder):
     (folder / "home/.config/gtk-3.0/settings.ini").write_text("[Settings]\ngtk-enable-animations=0\n")
     with Desktop(folder, pictures / "a.gif") as desktop:
         desktop.wait(r"view-frame frame 1 of 5, paused")
-        desktop.wait(r"painted-files")  # the frame comes behind the picture, and would take the keyboard
+        # the frame comes behind the picture, and would take the keyboard
+        desktop.wait(r"painted-files")
         desktop.focus("View")
         desktop.key("space")
         desktop.wait(r"view-frame frame 2 of 5$")
@@ -273,7 +278,8 @@ def later_starts(folder):
         desktop.wait(r"browser tabs=1 lines=1 .*listing=0 .*folder=.*other$")
         own.terminate()
         own.wait()
-        # One that hangs keeps nobody waiting, and does not do later what the other has done meanwhile.
+        # One that hangs keeps nobody waiting, and does not do later what the other has done
+        # meanwhile.
         desktop.program.send_signal(signal.SIGSTOP)
         later = desktop.start_again(other)
         desktop.wait(r"browser tabs=1 lines=1 .*listing=0 .*folder=.*other$")

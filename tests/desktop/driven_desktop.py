@@ -1,7 +1,8 @@
-"""Drives the real desktop program on a display of its own: keys and mouse go in, its event log comes out.
+"""Drives the real desktop program on a display of its own: keys and mouse go in, its event log
+comes out.
 
-Tests wait for what the log tells, never for a time. Each test gets its own display, data folder and home; screenshots
-are kept in build/screenshots.
+Tests wait for what the log tells, never for a time. Each test gets its own display, data folder and
+home; screenshots are kept in build/screenshots.
 """
 import os
 import re
@@ -49,8 +50,10 @@ class Desktop:
         self.frames = tempfile.TemporaryDirectory()
         reader, writer = os.pipe()
         self.server = subprocess.Popen(
-            ["Xvfb", "-displayfd", str(writer), "-screen", "0", f"{self.size[0]}x{self.size[1]}x24", "-fbdir", self.frames.name,
-             "-nolisten", "tcp", "-noreset"], pass_fds=[writer], stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL)
+            ["Xvfb", "-displayfd", str(writer), "-screen", "0", f"{self.size[0]}x{self.size[1]}x24",
+             "-fbdir", self.frames.name,
+             "-nolisten", "tcp", "-noreset"], pass_fds=[writer], stdout=subprocess.DEVNULL,
+             stderr=subprocess.DEVNULL)
         os.close(writer)
         with os.fdopen(reader) as line:
             number = line.readline().strip()
@@ -61,9 +64,13 @@ class Desktop:
         runtime = self.folder / "run"
         runtime.mkdir(mode=0o700, exist_ok=True)
         self.environment = dict(
-            os.environ, DISPLAY=":" + number, HOME=str(home), XDG_DATA_HOME=str(home / ".local/share"), XDG_CONFIG_HOME=str(home / ".config"),
-            XDG_RUNTIME_DIR=str(runtime), FOTOMILL_DATA=str(self.data), FOTOMILL_DESKTOP_LOG=str(self.log), GDK_BACKEND="x11", NO_AT_BRIDGE="1", LC_ALL="C.UTF-8", LANGUAGE="en",
-            GTK_THEME="Adwaita", ASAN_OPTIONS=os.environ.get("ASAN_OPTIONS", "") + ":detect_leaks=0")
+            os.environ, DISPLAY=":" + number, HOME=str(home),
+            XDG_DATA_HOME=str(home / ".local/share"), XDG_CONFIG_HOME=str(home / ".config"),
+            XDG_RUNTIME_DIR=str(runtime), FOTOMILL_DATA=str(self.data),
+            FOTOMILL_DESKTOP_LOG=str(self.log), GDK_BACKEND="x11", NO_AT_BRIDGE="1",
+            LC_ALL="C.UTF-8", LANGUAGE="en",
+            GTK_THEME="Adwaita",
+            ASAN_OPTIONS=os.environ.get("ASAN_OPTIONS", "") + ":detect_leaks=0")
         self.start()
         return self
 
@@ -83,17 +90,20 @@ class Desktop:
         self.frames.cleanup()
 
     def start(self):
-        program = os.environ.get("FOTOMILL_DESKTOP", str(PROJECT / "build/release/fotomill-desktop"))
+        program = os.environ.get("FOTOMILL_DESKTOP",
+                                 str(PROJECT / "build/release/fotomill-desktop"))
         self.output = self.folder / "output"
         self.log.write_text("")
         self.seen = 0
         with self.output.open("w") as output:
-            self.program = subprocess.Popen([program, *self.arguments], env=self.environment, stdout=output, stderr=output,
+            self.program = subprocess.Popen([program, *self.arguments], env=self.environment,
+                                            stdout=output, stderr=output,
                                             stdin=subprocess.DEVNULL)
 
     def start_again(self, *arguments):
         """A later start of the program, beside the one that runs. Its events go to the same log."""
-        return subprocess.Popen([self.program.args[0], *map(str, arguments)], env=self.environment, stdin=subprocess.DEVNULL)
+        return subprocess.Popen([self.program.args[0], *map(str, arguments)], env=self.environment,
+                                stdin=subprocess.DEVNULL)
 
     # --- what comes out ---
 
@@ -111,7 +121,8 @@ class Desktop:
                         self.seen += match.end()
                     return match.group(1)
             if self.program.poll() is not None:
-                raise Failure(f"the program ended with {self.program.returncode}, waiting for {pattern}")
+                status = self.program.returncode
+                raise Failure(f"the program ended with {status}, waiting for {pattern}")
             time.sleep(0.03)
         raise Failure(f"waited in vain for {pattern}")
 
@@ -123,12 +134,14 @@ class Desktop:
     # --- what goes in ---
 
     def xdotool(self, *arguments):
-        done = subprocess.run(["xdotool", *map(str, arguments)], env=self.environment, capture_output=True, text=True)
+        done = subprocess.run(["xdotool", *map(str, arguments)], env=self.environment,
+                              capture_output=True, text=True)
         return done.stdout.split()
 
     def focus(self, title, settle=True, native=False):
-        """Gives the keyboard to the window of a title: there is no window manager to do it. Waits until the window has been
-        drawn, unless it is one that goes on changing. A `native` box is the toolkit's own: the log never tells of it."""
+        """Gives the keyboard to the window of a title: there is no window manager to do it. Waits
+        until the window has been drawn, unless it is one that goes on changing. A `native` box is
+        the toolkit's own: the log never tells of it."""
         end = time.monotonic() + PATIENCE
         while time.monotonic() < end:
             windows = self.xdotool("search", "--onlyvisible", "--name", title)
@@ -138,7 +151,9 @@ class Desktop:
                     known = self.log_text().count(" active ")
                     self.xdotool("windowfocus", "--sync", windows[-1])
                     # Keys that come before the program knows of it go nowhere.
-                    while not native and self.log_text().count(" active ") == known and time.monotonic() < end:
+                    while not native and self.log_text().count(" active ") == known:
+                        if time.monotonic() >= end:
+                            break
                         time.sleep(0.03)
                 if settle:
                     self.settle()
@@ -165,7 +180,8 @@ class Desktop:
         self.settle()
         place = PROJECT / "build/screenshots"
         place.mkdir(parents=True, exist_ok=True)
-        (place / (name + ".png")).write_bytes(png_of_xwd((Path(self.frames.name) / "Xvfb_screen0").read_bytes()))
+        screen = (Path(self.frames.name) / "Xvfb_screen0").read_bytes()
+        (place / (name + ".png")).write_bytes(png_of_xwd(screen))
 
 
 def png_of_xwd(data):
@@ -182,10 +198,12 @@ def png_of_xwd(data):
         rows += b"\0" + rgb
 
     def chunk(kind, body):
-        return struct.pack(">I", len(body)) + kind + body + struct.pack(">I", zlib.crc32(kind + body))
+        check = struct.pack(">I", zlib.crc32(kind + body))
+        return struct.pack(">I", len(body)) + kind + body + check
 
     head = struct.pack(">2I5B", width, height, 8, 2, 0, 0, 0)
-    return b"\x89PNG\r\n\x1a\n" + chunk(b"IHDR", head) + chunk(b"IDAT", zlib.compress(bytes(rows), 6)) + chunk(b"IEND", b"")
+    pixels = chunk(b"IDAT", zlib.compress(bytes(rows), 6))
+    return b"\x89PNG\r\n\x1a\n" + chunk(b"IHDR", head) + pixels + chunk(b"IEND", b"")
 
 
 def run(*tests):
@@ -209,17 +227,21 @@ def run(*tests):
 def gif_of_frames(delays, size=(400, 300)):
     """An animation of frames in one color each, for ever; delays in hundredths of a second."""
     def block(data):
-        return b"".join(bytes([len(data[i:i + 255])]) + data[i:i + 255] for i in range(0, len(data), 255)) + b"\0"
+        return b"".join(bytes([len(data[i:i + 255])]) + data[i:i + 255]
+                        for i in range(0, len(data), 255)) + b"\0"
 
     width, height = size
     colors = bytes((40 * i * j) % 256 for i in range(1, 9) for j in (1, 2, 3))
-    gif = b"GIF89a" + struct.pack("<2H3B", width, height, 0xF2, 0, 0) + colors + b"!\xff\x0bNETSCAPE2.0\3\1\0\0\0"
+    gif = b"GIF89a" + struct.pack("<2H3B", width, height, 0xF2, 0, 0)
+    gif += colors + b"!\xff\x0bNETSCAPE2.0\3\1\0\0\0"
     for number, delay in enumerate(delays):
         # A code of 4 bits a pixel, and a clear code often enough that codes stay that long.
-        codes = [code for i in range(width * height) for code in ([8, number % 8] if i % 6 == 0 else [number % 8])] + [9]
+        codes = [code for i in range(width * height)
+                 for code in ([8, number % 8] if i % 6 == 0 else [number % 8])] + [9]
         codes += [0] * (len(codes) % 2)
         pixels = bytes(low | high << 4 for low, high in zip(codes[0::2], codes[1::2]))
-        gif += b"!\xf9\4\0" + struct.pack("<H", delay) + b"\0\0," + struct.pack("<4H", 0, 0, width, height) + b"\0\3" + block(pixels)
+        gif += b"!\xf9\4\0" + struct.pack("<H", delay) + b"\0\0,"
+        gif += struct.pack("<4H", 0, 0, width, height) + b"\0\3" + block(pixels)
     return gif + b";"
 
 
@@ -234,6 +256,7 @@ def make_pictures(folder, names):
         else:
             program = os.environ.get("FOTOMILL", str(PROJECT / "build/release/fotomill"))
             made = folder / ("bmp-true-color" + target.suffix)
-            subprocess.run([program, "convert", str(sample), "--to", target.suffix[1:], "--dest", str(folder)], check=True,
+            subprocess.run([program, "convert", str(sample), "--to", target.suffix[1:], "--dest",
+                            str(folder)], check=True,
                            stdout=subprocess.DEVNULL)
             made.rename(target)

@@ -81,7 +81,8 @@ def rename_in_sequence(folder):
         desktop.key("Return")
         desktop.wait(r"batch ended")
         desktop.wait(r"listed 3")
-        assert names(pictures) == ["beach0001.bmp", "beach0002.bmp", "beach0003.bmp"], names(pictures)
+        assert names(pictures) == ["beach0001.bmp", "beach0002.bmp",
+                                   "beach0003.bmp"], names(pictures)
         desktop.focus("Fotomill Professional")
         desktop.key("ctrl+z")
         desktop.wait(r"files Undo rename of 3 files done=3")

@@ -31,11 +31,13 @@ def frames(seed, alpha):
 
 
 def told(path):
-    return json.loads(subprocess.run([FOTOMILL, "info", "--json", "-q", path], stdout=subprocess.PIPE, check=True).stdout)[0]
+    return json.loads(subprocess.run([FOTOMILL, "info", "--json", "-q", path],
+                                     stdout=subprocess.PIPE, check=True).stdout)[0]
 
 
 def page(path, number, folder):
-    subprocess.run([FOTOMILL, "convert", "-t", "png", "--page", str(number), "-d", str(folder), "--overwrite", "replace", "-q", str(path)],
+    subprocess.run([FOTOMILL, "convert", "-t", "png", "--page", str(number), "-d", str(folder),
+                    "--overwrite", "replace", "-q", str(path)],
                    stdout=subprocess.DEVNULL, check=True)
     return Image.open(folder / (path.stem + ".png")).convert("RGBA")
 
@@ -53,8 +55,10 @@ def check(path, rounds, folder):
     for number, delay in enumerate(facts["delaysMs"]):
         judge.seek(number)
         judge.load()
-        assert delay == judge.info.get("duration", 0), (path, number, delay, judge.info.get("duration", 0))
-        assert visible(page(path, number + 1, folder)) == visible(judge.convert("RGBA")), (path, number)
+        assert delay == judge.info.get("duration", 0), (path, number, delay,
+                                                        judge.info.get("duration", 0))
+        seen = page(path, number + 1, folder)
+        assert visible(seen) == visible(judge.convert("RGBA")), (path, number)
 
 
 def cut_in_a_frame(path, folder):
@@ -62,7 +66,8 @@ def cut_in_a_frame(path, folder):
     broken = folder / ("cut" + path.suffix)
     broken.write_bytes(path.read_bytes()[:-60])
     page(broken, 1, folder / "pages")
-    assert subprocess.run([FOTOMILL, "verify", broken], stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL).returncode != 0
+    assert subprocess.run([FOTOMILL, "verify", broken], stdout=subprocess.DEVNULL,
+                          stderr=subprocess.DEVNULL).returncode != 0
 
 
 def main():
@@ -70,10 +75,12 @@ def main():
         folder = Path(name)
         (folder / "pages").mkdir()
         # loop as the file has it: none at all, for ever, a number of repetitions
-        for disposal, alpha, loop, rounds in ((0, False, None, 1), (1, True, 0, 0), (2, True, 1, 2), (3, True, 9, 10)):
+        for disposal, alpha, loop, rounds in ((0, False, None, 1), (1, True, 0, 0), (2, True, 1, 2),
+                                              (3, True, 9, 10)):
             path = folder / f"disposal{disposal}.gif"
             first, *rest = frames(disposal, alpha)
-            first.save(path, save_all=True, append_images=rest, duration=DELAYS, disposal=[0] + [disposal] * len(rest),
+            first.save(path, save_all=True, append_images=rest, duration=DELAYS,
+                       disposal=[0] + [disposal] * len(rest),
                        **({} if loop is None else {"loop": loop}))
             check(path, rounds, folder / "pages")
         cut_in_a_frame(path, folder)
@@ -81,7 +88,8 @@ def main():
             for alpha, loop in ((False, 0), (True, 3)):
                 path = folder / f"alpha{alpha}.webp"
                 first, *rest = frames(7, alpha)
-                first.save(path, save_all=True, append_images=rest, duration=DELAYS, loop=loop, lossless=True)
+                first.save(path, save_all=True, append_images=rest, duration=DELAYS, loop=loop,
+                           lossless=True)
                 check(path, loop, folder / "pages")
             cut_in_a_frame(path, folder)
 

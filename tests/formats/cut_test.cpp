@@ -114,7 +114,12 @@ TEST(Cut, ColorsDoNotCrossBlocks) {
   EXPECT_EQ(folder.Names(), (Names{"A.CUT", "A.PAL"}));
   const Bytes palette = ReadBytes(folder.Path("A.PAL"));
   ASSERT_EQ(palette.size(), 2048u);
-  for (const auto& [color, offset] : {std::pair<size_t, size_t>{0, 40}, {77, 502}, {78, 512}, {162, 1016}, {163, 1024}, {255, 1578}}) {
+  for (const auto& [color, offset] : {std::pair<size_t, size_t>{0, 40},
+                                      {77, 502},
+                                      {78, 512},
+                                      {162, 1016},
+                                      {163, 1024},
+                                      {255, 1578}}) {
     EXPECT_EQ(palette[offset], picture->palette[3 * color]) << color;
     EXPECT_EQ(palette[offset + 4], picture->palette[3 * color + 2]) << color;
   }
@@ -127,7 +132,9 @@ TEST(Cut, BothFilesAppearOrNeither) {
   const TemporaryFolder folder;
   const PicturePointer picture = PatternPicture(4, 4, 8);
   picture->fileName.AssignCut(folder.Path("a.cut"));
-  const auto write = [&](platform::Existing existing) { return CutWrite(*picture, {.existing = existing}); };
+  const auto write = [&](platform::Existing existing) {
+    return CutWrite(*picture, {.existing = existing});
+  };
 
   WriteText(folder.Path("a.pal"), "somebody's own");  // a palette of another program
   EXPECT_EQ(write(platform::Existing::Replace), Status::ErrorCreatingFile);

@@ -1,7 +1,8 @@
 #!/usr/bin/env python3
 """Pictures that the program writes are read by programs of others, and look as they did before.
 
-A row: the format, the sample that is converted to it, and the command that makes a portable anymap of standard input.
+A row: the format, the sample that is converted to it, and the command that makes a portable anymap
+of standard input.
 """
 import os
 import shutil
@@ -65,10 +66,12 @@ def anymap(command, data):
     width, height = map(int, size.split())
     if kind == b"P4":
         stride = (width + 7) // 8
-        bits = (rest[y * stride + x // 8] >> (7 - x % 8) & 1 for y in range(height) for x in range(width))
+        bits = (rest[y * stride + x // 8] >> (7 - x % 8) & 1 for y in range(height)
+                for x in range(width))
         return width, height, b"".join(b"\0\0\0" if bit else b"\xff\xff\xff" for bit in bits)
     pixels = rest.split(b"\n", 1)[1]
-    return width, height, pixels if kind == b"P6" else b"".join(bytes([value] * 3) for value in pixels)
+    return width, height, pixels if kind == b"P6" else b"".join(bytes([value] * 3)
+                                                                for value in pixels)
 
 
 def main():
@@ -82,7 +85,8 @@ def main():
         there = [row for row in FILE_ROWS if shutil.which(row[2].split()[0]) is not None]
         for extension, sample, command in ROWS + there:
             source = PROJECT / "samples" / sample
-            subprocess.run([FOTOMILL, "--quiet", "convert", source, "--to", extension, "--dest", folder, "--overwrite", "replace"],
+            subprocess.run([FOTOMILL, "--quiet", "convert", source, "--to", extension, "--dest",
+                            folder, "--overwrite", "replace"],
                            check=True, stdout=subprocess.DEVNULL)
             file = (Path(folder) / source.stem).with_suffix("." + extension)
             made = INNER.get(extension, bytes)(file.read_bytes())

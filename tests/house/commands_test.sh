@@ -1,5 +1,6 @@
 #!/usr/bin/env bash
-# ./fotomill and ./check on a small project of their own: what is built when, what reaches standard output, how tests count.
+# ./fotomill and ./check on a small project of their own: what is built when, what reaches standard
+# output, how tests count.
 set -u
 project=$(cd "$(dirname "${BASH_SOURCE[0]}")/../.." && pwd -P)
 work=$(mktemp -d)
@@ -55,26 +56,31 @@ Case() {  # Case NAME STATEMENTS: a test program
 # The launcher.
 Program one
 mkdir "$work/elsewhere" && cd "$work/elsewhere" || exit 1
-Expect "first run, arguments, input, status" "one a b c -in- 3" "$("../a tree/fotomill" a 'b c' <<<' -in-' 2>/dev/null) $?"
+Expect "first run, arguments, input, status" "one a b c -in- 3" \
+  "$("../a tree/fotomill" a 'b c' <<<' -in-' 2>/dev/null) $?"
 Expect "standard output holds results only" "" "$("$tree/fotomill" 2>&1 >/dev/null </dev/null)"
 ln -s "$tree/fotomill" link
 Expect "through a link" "one x" "$(./link x </dev/null 2>&1)"
 PATH=/usr/bin:/bin
 mkdir "$work/bin" && printf '#!/bin/sh\necho called >&2\nexit 1\n' | tee "$work/bin/ninja" "$work/bin/cmake" >"$work/bin/dpkg-query"
 chmod +x "$work"/bin/*
-Expect "up to date: no tool is called" "one" "$(PATH=$work/bin:$PATH "$tree/fotomill" </dev/null 2>&1)"
+Expect "up to date: no tool is called" "one" \
+  "$(PATH=$work/bin:$PATH "$tree/fotomill" </dev/null 2>&1)"
 sleep 0.01 && Program two
 Expect "a changed source" "two" "$("$tree/fotomill" </dev/null 2>/dev/null)"
 printf 'int broken(\n' >>"$tree/src/main.c"
-Expect "a source that does not compile" "*main.c*error*1" "$("$tree/fotomill" </dev/null 2>&1; echo $?)"
+Expect "a source that does not compile" "*main.c*error*1" \
+  "$("$tree/fotomill" </dev/null 2>&1; echo $?)"
 Program three
 Expect "two at a time" "three three" "$(echo $("$tree/fotomill" </dev/null 2>/dev/null & "$tree/fotomill" </dev/null 2>/dev/null; wait; echo) |
   sed 's/threethree/three three/')"
 mv "$tree" "$work/moved" && tree=$work/moved
 Expect "a tree that was moved" "three" "$("$tree/fotomill" </dev/null 2>/dev/null)"
-Expect "no desktop program yet: a command like others" "three desktop X" "$("$tree/fotomill" desktop X </dev/null 2>/dev/null)"
+Expect "no desktop program yet: a command like others" "three desktop X" \
+  "$("$tree/fotomill" desktop X </dev/null 2>/dev/null)"
 mkdir "$tree/src/desktop"
-Expect "the desktop program, once it is there" "three X" "$("$tree/fotomill" desktop X </dev/null 2>/dev/null)"
+Expect "the desktop program, once it is there" "three X" \
+  "$("$tree/fotomill" desktop X </dev/null 2>/dev/null)"
 printf '[build]\nno-such-package-anywhere\n[cli]\n' >"$tree/packages.txt"
 for tool in apt-get sudo; do printf '#!/bin/sh\nexit 1\n' >"$work/bin/$tool"; done
 chmod +x "$work"/bin/* && rm "$work"/bin/{ninja,cmake,dpkg-query}

@@ -1,8 +1,10 @@
 #!/usr/bin/env python3
-"""Holds the sources to the order of the house: who may include whom, where a system shows, how long a file may be.
+"""Holds the sources to the order of the house: who may include whom, where a system shows, how long
+a file may be.
 
-house_test.py [PROJECT] prints each breach as FILE:LINE: MESSAGE and fails if there is one. Before it judges the project it
-judges a small tree with one breach of every rule, so that a rule that no longer bites fails as well.
+house_test.py [PROJECT] prints each breach as FILE:LINE: MESSAGE and fails if there is one. Before
+it judges the project it judges a small tree with one breach of every rule, so that a rule that no
+longer bites fails as well.
 """
 import re
 import sys
@@ -10,7 +12,8 @@ import tempfile
 from collections import Counter
 from pathlib import Path
 
-# The rooms of src/ from the ground up. A file includes from its own room and from rooms of lower floors.
+# The rooms of src/ from the ground up. A file includes from its own room and from rooms of lower
+# floors.
 FLOORS = [
     ["platform"],
     ["core"],
@@ -34,17 +37,21 @@ FLOORS = [
 ]
 FLOOR = {room: floor for floor, rooms in enumerate(FLOORS) for room in rooms}
 
-# What only the folder of one system may include or ask for. Files are read and written through src/platform.
-# What a plug-in author includes stands alone, so it may ask which system it is compiled for.
+# What only the folder of one system may include or ask for. Files are read and written through
+# src/platform. What a plug-in author includes stands alone, so it may ask which system it is
+# compiled for.
 SYSTEM_HEADERS = {"src/plugins/fotomill_plugin.h"}
 SYSTEM_FOLDERS = {"src/platform/posix", "src/platform/windows"}
 SYSTEM_HEADER = re.compile(
-    r"(sys|linux|net|netinet|arpa|asm)/.*|(unistd|fcntl|dirent|dlfcn|pthread|poll|pwd|grp|termios|spawn|mntent|glob|ftw|"
-    r"sched|utime|signal|csignal|libgen|strings|windows|windowsx|winsock2|winioctl|shlobj|shellapi|direct|io|process)(\.h)?|"
+    r"(sys|linux|net|netinet|arpa|asm)/.*|(unistd|fcntl|dirent|dlfcn|pthread|poll|pwd|grp|termios|"
+    r"spawn|mntent|glob|ftw|sched|utime|signal|csignal|libgen|strings|windows|windowsx|winsock2|"
+    r"winioctl|shlobj|shellapi|direct|io|process)(\.h)?|"
     r"filesystem|fstream")
-SYSTEM_MACRO = re.compile(r"\s*#\s*(if|elif|ifdef|ifndef).*(_WIN32|_WIN64|\bWIN32|__WINDOWS__|__linux|__unix|__APPLE__|__MINGW|_MSC_VER|"
-                          r"__FreeBSD__|__ANDROID__)")
-# Who begins a thread: the pool, and what the system needs one for. Everybody else gives the pool a task.
+SYSTEM_MACRO = re.compile(
+    r"\s*#\s*(if|elif|ifdef|ifndef).*(_WIN32|_WIN64|\bWIN32|__WINDOWS__|__linux|__unix|__APPLE__|"
+    r"__MINGW|_MSC_VER|__FreeBSD__|__ANDROID__)")
+# Who begins a thread: the pool, and what the system needs one for. Everybody else gives the pool a
+# task.
 THREAD = re.compile(r"std::(j?thread\b(?!::)|async\b)|\bpthread_create\b|\bwxThread\b")
 THREAD_FOLDERS = ("src/core/workers/worker_pool.", "src/platform/")
 INCLUDE = re.compile(r'\s*#\s*include\s*(["<])([^">]+)[">]')
@@ -76,17 +83,21 @@ def include_breaches(path, line):
     in_system_folder = any(f"src/{path}".startswith(folder + "/") for folder in SYSTEM_FOLDERS)
     if quoted and other not in FLOOR:
         yield f'"{target}" is not named from src/ with its room'
-    elif quoted and other == "settings" and own in SETTINGS_DOORS and path not in SETTINGS_DOORS[own]:
-        yield f"{own} may not include settings ({target}); a job gets what it needs where it is made"
+    elif (quoted and other == "settings" and own in SETTINGS_DOORS
+          and path not in SETTINGS_DOORS[own]):
+        yield (f"{own} may not include settings ({target}); "
+               "a job gets what it needs where it is made")
     elif quoted and other != own and FLOOR[other] >= FLOOR.get(own, -1):
         yield f"{own} may not include {other} ({target})"
-    elif quoted and any(f"src/{target}".startswith(folder + "/") for folder in SYSTEM_FOLDERS) and not in_system_folder:
+    elif quoted and any(f"src/{target}".startswith(folder + "/")
+                        for folder in SYSTEM_FOLDERS) and not in_system_folder:
         yield f"{target} belongs to one system; include its door in src/platform"
     if not quoted and SYSTEM_HEADER.fullmatch(target) and not in_system_folder:
         yield f"<{target}> belongs behind a door of src/platform"
     if not quoted and target.startswith("wx/") and own != "desktop":
         yield f"<{target}> outside src/desktop"
-    if path.startswith(MODELS) and (quoted and target.startswith(WINDOWS) or not quoted and target.startswith("wx/")):
+    if path.startswith(MODELS) and (quoted and target.startswith(WINDOWS) or not quoted
+                                    and target.startswith("wx/")):
         yield f"a model may not include {target}"
 
 
@@ -120,7 +131,8 @@ def breaches(project):
     """Every breach in a project as (file, line, message)."""
     includes = {}
     sources = [path for folder in ("src", "tests", "fuzz", "bench", "samples")
-               for path in sorted((project / folder).rglob("*")) if path.suffix in {".cpp", ".h", ".def", ".py", ".sh"}]
+               for path in sorted((project / folder).rglob("*"))
+               if path.suffix in {".cpp", ".h", ".def", ".py", ".sh"}]
     if not sources:
         yield str(project), 1, "has no sources"
     for source in sources:
@@ -136,13 +148,15 @@ def breaches(project):
         path = name[len("src/"):]
         if path.split("/")[0] not in FLOOR:
             yield name, 1, "is in no room that this test knows"
-        includes[name] = ["src/" + match.group(2) for match in map(INCLUDE.match, lines) if match and match.group(1) == '"']
+        includes[name] = ["src/" + match.group(2) for match in map(INCLUDE.match, lines) if match
+                          and match.group(1) == '"']
         for number, line in enumerate(lines, 1):
             for message in include_breaches(path, line):
                 yield name, number, message
             if THREAD.search(line.split("//")[0]) and not name.startswith(THREAD_FOLDERS):
                 yield name, number, "begins a thread; have src/core/workers do it"
-            if SYSTEM_MACRO.match(line) and name not in SYSTEM_HEADERS and not any(name.startswith(folder + "/") for folder in SYSTEM_FOLDERS):
+            in_system_folder = any(name.startswith(folder + "/") for folder in SYSTEM_FOLDERS)
+            if SYSTEM_MACRO.match(line) and name not in SYSTEM_HEADERS and not in_system_folder:
                 yield name, number, "asks which system it runs on outside src/platform"
     yield from circle_breaches(includes)
     yield from crowd_breaches(source.relative_to(project).as_posix() for source in sources)
@@ -153,13 +167,16 @@ EXAMPLES = [
     ("src/core/text.cpp", '#include "core/text.h"\n#include <string>\n', None),
     ("src/core/text.h", '#include "platform/files.h"\n', None),
     ("src/platform/files.h", "", None),
-    ("src/platform/posix/files.cpp", '#include "platform/files.h"\n#include <unistd.h>\n#ifdef __linux__\n#endif\n', None),
+    ("src/platform/posix/files.cpp",
+     '#include "platform/files.h"\n#include <unistd.h>\n#ifdef __linux__\n#endif\n', None),
     ("src/registry/registry.cpp", '#include "formats/bmp/bmp.h"\n', None),
     ("src/formats/bmp/bmp.h", '#include "picture/packed_image.h"\n', None),
     ("src/picture/palette.h", '#include "formats/bmp/bmp.h"\n', "picture may not include formats"),
-    ("src/formats/pcx/pcx.cpp", '#include "registry/registry.h"\n', "formats may not include registry"),
+    ("src/formats/pcx/pcx.cpp", '#include "registry/registry.h"\n',
+     "formats may not include registry"),
     ("src/plugins/bridge.cpp", '#include "catalog/thumb.h"\n', "plugins may not include catalog"),
-    ("src/drawing/text.cpp", '#include "settings/settings.h"\n', "drawing may not include settings"),
+    ("src/drawing/text.cpp", '#include "settings/settings.h"\n',
+     "drawing may not include settings"),
     ("src/batch/run.cpp", '#include "settings/settings.h"\n', "a job gets what it needs"),
     ("src/batch/new_job.cpp", '#include "settings/settings.h"\n', None),
     ("src/settings/settings.h", "", None),
@@ -179,9 +196,12 @@ EXAMPLES = [
     ("src/core/long.cpp", "\n" * (LONGEST_FILE + 1), "longer than"),
     ("src/core/common.h", "", "is a drawer"),
     ("src/attic/box.cpp", "", "no room"),
-    ("src/desktop/models/list.cpp", "#include <wx/string.h>\n", "a model may not include wx/string.h"),
-    ("src/desktop/models/tree.cpp", '#include "desktop/windows/frame.h"\n', "a model may not include desktop/windows/frame.h"),
-    ("src/desktop/windows/frame.h", '#include "desktop/models/tree.h"\n#include <wx/frame.h>\n', None),
+    ("src/desktop/models/list.cpp", "#include <wx/string.h>\n",
+     "a model may not include wx/string.h"),
+    ("src/desktop/models/tree.cpp", '#include "desktop/windows/frame.h"\n',
+     "a model may not include desktop/windows/frame.h"),
+    ("src/desktop/windows/frame.h", '#include "desktop/models/tree.h"\n#include <wx/frame.h>\n',
+     None),
     ("src/texts", None, "holds 41 sources"),
     *[(f"src/texts/step{number}.h", "", None) for number in range(MOST_FILES + 1)],
 ]
@@ -201,7 +221,7 @@ def own_faults():
             found.setdefault(name, []).append(message)
     for name, _, expected in EXAMPLES:
         messages = found.get(name, [])
-        if expected is None and messages or expected is not None and not any(expected in message for message in messages):
+        if not (any(expected in message for message in messages) if expected else not messages):
             yield f"example {name}: expected {expected}, found {messages}"
 
 

@@ -51,8 +51,10 @@ def unclipped(picture):
 def apply(folder, source, recipe):
     """What the program makes of a picture."""
     source.save(folder / "in.png")
-    result = subprocess.run([PROGRAM, "apply", str(folder / "in.png"), "--do", recipe, "--to", "png", "--out", str(folder / "out.png"),
-                             "--overwrite", "replace"], stdin=subprocess.DEVNULL, capture_output=True)
+    result = subprocess.run([PROGRAM, "apply", str(folder / "in.png"), "--do", recipe, "--to",
+                             "png", "--out", str(folder / "out.png"),
+                             "--overwrite", "replace"], stdin=subprocess.DEVNULL,
+                             capture_output=True)
     if result.returncode != 0:
         faults.append(f"{recipe}: status {result.returncode}, {result.stderr.decode()}")
         return None
@@ -62,7 +64,8 @@ def apply(folder, source, recipe):
 
 
 def largest_difference(made, expected):
-    return max(high for _, high in ImageChops.difference(made.convert("RGB"), expected.convert("RGB")).getextrema())
+    return max(high for _, high in ImageChops.difference(made.convert("RGB"),
+                                                         expected.convert("RGB")).getextrema())
 
 
 def solid(picture, color):
@@ -80,7 +83,8 @@ def hue_turned(picture, degrees):
     def turn(color):
         if color not in cache:
             h, s, v = colorsys.rgb_to_hsv(*(c / 255 for c in color))
-            cache[color] = tuple(int(c * 255 + 0.5) for c in colorsys.hsv_to_rgb((h + degrees / 360) % 1, s, v))
+            cache[color] = tuple(int(c * 255 + 0.5)
+                                 for c in colorsys.hsv_to_rgb((h + degrees / 360) % 1, s, v))
         return cache[color]
 
     made.putdata([turn(color) for color in picture.getdata()])
@@ -100,7 +104,8 @@ EFFECTS = [
     ("sepia", lambda p: p.convert("RGB", SEPIA), 1),
     ("solarize 100", lambda p: ImageOps.solarize(p, 100), 0),
     ("tint #ff8800 25%", lambda p: Image.blend(p, solid(p, (255, 136, 0)), 0.25), 1),
-    ("colorize #b08040", lambda p: ImageOps.colorize(p.convert("L"), "black", "white", (0xB0, 0x80, 0x40)), 3),
+    ("colorize #b08040", lambda p: ImageOps.colorize(p.convert("L"), "black", "white",
+                                                     (0xB0, 0x80, 0x40)), 3),
     ("auto-levels 0", ImageOps.autocontrast, 1),
     ("auto-levels 2", lambda p: ImageOps.autocontrast(p, cutoff=2), 1),
     ("equalize", ImageOps.equalize, 2),  # Pillow rounds its step down
@@ -110,13 +115,15 @@ EFFECTS = [
     ("hue -140", lambda p: hue_turned(p, -140), 1),
 ]
 
-# (operation, size, Pillow's filter): within one level where nothing clips, since Pillow clamps between its two passes.
-FILTERS = {"box": Image.Resampling.BOX, "triangle": Image.Resampling.BILINEAR, "bicubic": Image.Resampling.BICUBIC,
+# (operation, size, Pillow's filter): within one level where nothing clips, since Pillow clamps
+# between its two passes.
+FILTERS = {"box": Image.Resampling.BOX, "triangle": Image.Resampling.BILINEAR,
+           "bicubic": Image.Resampling.BICUBIC,
            "lanczos3": Image.Resampling.LANCZOS}
 SIZES = [(480, 360), (360, 270), (241, 181), (97, 61), (33, 400), (700, 50)]
 
-# (operation, Pillow's own reduction, how much noisier than Pillow's the result may be, dB). Both are judged blurred, as the eye
-# sees them from afar.
+# (operation, Pillow's own reduction, how much noisier than Pillow's the result may be, dB). Both
+# are judged blurred, as the eye sees them from afar.
 REDUCTIONS = [
     ("reduce 256", lambda p: p.quantize(256, dither=Image.Dither.FLOYDSTEINBERG), 0),
     ("reduce 64", lambda p: p.quantize(64, dither=Image.Dither.FLOYDSTEINBERG), 0),
@@ -124,7 +131,8 @@ REDUCTIONS = [
     ("reduce 216 fixed", lambda p: p.convert("P", palette=Image.Palette.WEB), 0.5),
     ("mono bidirectional=no", lambda p: p.convert("1"), 0.5),
     ("mono", lambda p: p.convert("1"), 1.5),
-    ("mono dither=stucki bidirectional=no", lambda p: p.convert("1"), 5),  # wider kernels are coarser
+    ("mono dither=stucki bidirectional=no", lambda p: p.convert("1"), 5),
+    # wider kernels are coarser
     ("mono dither=sierra bidirectional=no", lambda p: p.convert("1"), 5),
     ("mono dither=burkes bidirectional=no", lambda p: p.convert("1"), 3.5),
 ]
@@ -148,7 +156,8 @@ def judge(folder, name, picture):
         for size in SIZES:
             recipe = f"resize {size[0]}x{size[1]} stretch {word}"
             made = apply(folder, calm, recipe)
-            if made is not None and (found := largest_difference(made, calm.resize(size, pillow))) > 1:
+            if made is not None and (found := largest_difference(made,
+                                                                 calm.resize(size, pillow))) > 1:
                 faults.append(f"{name}, {recipe}: {found} levels from Pillow's")
     for recipe, expected, decibels in REDUCTIONS:
         made = apply(folder, picture, recipe)
@@ -178,7 +187,8 @@ def judge_alpha(folder, picture):
             if (found := largest_difference(one, other)) > tolerance:
                 faults.append(f"{recipe} with alpha: {found} levels from Pillow's")
     made = apply(folder, with_alpha, "reduce 16")
-    if made is not None and (made.mode not in ("P", "RGBA") or made.convert("RGBA").getchannel("A").tobytes() != alpha.tobytes()):
+    if made is not None and (made.mode not in ("P", "RGBA")
+                             or made.convert("RGBA").getchannel("A").tobytes() != alpha.tobytes()):
         faults.append("reduce 16 does not keep alpha")
 
 

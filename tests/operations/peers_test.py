@@ -21,14 +21,16 @@ LOGO = os.path.join(tempfile.gettempdir(), f"fotomill-peers-{os.getpid()}.png")
 def sample():
     """Slopes, edges and some texture."""
     picture = Image.new("RGB", (WIDTH, HEIGHT))
-    picture.putdata([((x * 255 // WIDTH) ^ (y // 3 & 31), 230 if (x // 20 + y // 15) % 2 else 40, (x * y // 7 + 60) % 256)
+    picture.putdata([((x * 255 // WIDTH) ^ (y // 3 & 31), 230 if (x // 20 + y // 15) % 2 else 40,
+                      (x * y // 7 + 60) % 256)
                      for y in range(HEIGHT) for x in range(WIDTH)])
     return picture
 
 
 def perspective(picture):
     """Output (x, y) comes from (x + 0.2 y + 10, y + 5) - a map that Pillow takes as it is."""
-    return picture.transform((100, 70), Image.Transform.AFFINE, (1, 0.2, 10, 0, 1, 5), Image.Resampling.BILINEAR)
+    return picture.transform((100, 70), Image.Transform.AFFINE, (1, 0.2, 10, 0, 1, 5),
+                             Image.Resampling.BILINEAR)
 
 
 def shadowed(picture):
@@ -60,17 +62,21 @@ def stamped(picture):
 
 # line of a recipe, what Pillow makes of the picture, most levels apart, pixels of the border that are left out
 ROWS = [
-    ("rotate 7 filter=bilinear mode=keep", lambda p: p.rotate(-7, Image.Resampling.BILINEAR), 2, None),
-    ("rotate -24.5 filter=bilinear mode=keep", lambda p: p.rotate(24.5, Image.Resampling.BILINEAR), 2, None),
+    ("rotate 7 filter=bilinear mode=keep", lambda p: p.rotate(-7, Image.Resampling.BILINEAR), 2,
+     None),
+    ("rotate -24.5 filter=bilinear mode=keep", lambda p: p.rotate(24.5, Image.Resampling.BILINEAR),
+     2, None),
     ("rotate 90", lambda p: p.transpose(Image.Transpose.ROTATE_270), 0, 0),
     ("rotate 180", lambda p: p.transpose(Image.Transpose.ROTATE_180), 0, 0),
     ("offset 30 -11", lambda p: ImageChops.offset(p, 30, -11), 0, 0),
     ("crop 40x30+7+9", lambda p: p.crop((7, 9, 47, 39)), 0, 0),
     ("canvas 200x97 gravity=left background=#102030", lambda p: pasted(p), 0, 0),
     ("perspective 10,5 110,5 124,75 24,75 size=100x70 filter=bilinear", perspective, 2, 0),
-    ("kernel '1 2 1 2 4 2 1 2 1'", lambda p: p.filter(ImageFilter.Kernel((3, 3), (1, 2, 1, 2, 4, 2, 1, 2, 1))), 1, 1),
+    ("kernel '1 2 1 2 4 2 1 2 1'",
+     lambda p: p.filter(ImageFilter.Kernel((3, 3), (1, 2, 1, 2, 4, 2, 1, 2, 1))), 1, 1),
     ("kernel '-1 -2 0 -2 9 1 0 1 0' divisor=4 bias=30",
-     lambda p: p.filter(ImageFilter.Kernel((3, 3), (0, 1, 0, -2, 9, 1, -1, -2, 0), 4, 30)), 1, 1),  # Pillow counts rows from below
+     lambda p: p.filter(ImageFilter.Kernel((3, 3), (0, 1, 0, -2, 9, 1, -1, -2, 0), 4, 30)), 1, 1),
+     # Pillow counts rows from below
     ("median 2", lambda p: p.filter(ImageFilter.MedianFilter(5)), 0, 2),
     ("minimum 1", lambda p: p.filter(ImageFilter.MinFilter(3)), 0, 1),
     ("box-blur 3", lambda p: p.filter(ImageFilter.BoxBlur(3)), 1, 0),
@@ -99,7 +105,8 @@ def letters():
     expected = Image.new("L", size, 255)
     draw = ImageDraw.Draw(expected)
     draw.text((200, 30), text, 0, ImageFont.truetype(str(font), 30), anchor="mm")
-    boxes = [ImageChops.invert(picture).point(lambda v: 255 if v > 60 else 0).getbbox() for picture in (ours, expected)]
+    boxes = [ImageChops.invert(picture).point(lambda v: 255 if v > 60 else 0).getbbox()
+             for picture in (ours, expected)]
     widths, heights = ([box[2 + i] - box[i] for box in boxes] for i in (0, 1))
     inks = [sum(255 - v for v in picture.getdata()) for picture in (ours, expected)]
     if abs(widths[0] - widths[1]) > 4 or abs(heights[0] - heights[1]) > 2 or not 0.93 < inks[0] / inks[1] < 1.07:
@@ -110,7 +117,8 @@ def folder_picture(line):
     """A white pixel, put through a recipe."""
     with tempfile.TemporaryDirectory() as name:
         Image.new("L", (1, 1), 255).save(Path(name, "a.png"))
-        run = subprocess.run([FOTOMILL, "apply", Path(name, "a.png"), "--do", line, "--out", Path(name, "b.png"), "--to", "png"],
+        run = subprocess.run([FOTOMILL, "apply", Path(name, "a.png"), "--do", line, "--out",
+                              Path(name, "b.png"), "--to", "png"],
                              capture_output=True, text=True, check=False)
         if run.returncode != 0:
             faults.append(f"{line}: {run.stderr}")
@@ -128,7 +136,8 @@ def inside(picture, expected, border):
 
 def judge(folder, line, peer, most, border):
     source, result = folder / "in.png", folder / "out" / "in.png"
-    run = subprocess.run([FOTOMILL, "apply", source, "--do", line, "--dest", folder / "out", "--prefix", "", "--overwrite", "replace"],
+    run = subprocess.run([FOTOMILL, "apply", source, "--do", line, "--dest", folder / "out",
+                          "--prefix", "", "--overwrite", "replace"],
                          capture_output=True, text=True, check=False)
     if run.returncode != 0 or not result.exists():
         faults.append(f"{line}: status {run.returncode}: {run.stderr}")
@@ -138,7 +147,8 @@ def judge(folder, line, peer, most, border):
         faults.append(f"{line}: {ours.size}, not {expected.size}")
         return
     box = inside(ours, expected, border)
-    apart = max(high for _, high in ImageChops.difference(ours.crop(box), expected.crop(box)).getextrema())
+    apart = max(high for _, high in ImageChops.difference(ours.crop(box),
+                                                          expected.crop(box)).getextrema())
     if apart > most:
         faults.append(f"{line}: {apart} levels apart")
 

@@ -15,11 +15,13 @@ if not shutil.which("bmptopnm") or not shutil.which("pnmtoplainpnm"):
 
 
 def netpbm(*command, data=b""):
-    return subprocess.run(command, input=data, stdout=subprocess.PIPE, stderr=subprocess.DEVNULL, check=True).stdout
+    return subprocess.run(command, input=data, stdout=subprocess.PIPE, stderr=subprocess.DEVNULL,
+                          check=True).stdout
 
 
 def convert(source, extension, folder):
-    subprocess.run([FOTOMILL, "-q", "convert", str(source), "--to", extension, "--dest", folder], check=True,
+    subprocess.run([FOTOMILL, "-q", "convert", str(source), "--to", extension, "--dest", folder],
+                   check=True,
                    stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL)
     return Path(folder) / (Path(source).stem + "." + extension)
 
@@ -32,7 +34,8 @@ with tempfile.TemporaryDirectory() as folder:
             print(f"{name}: no such sample")
             failed += 1
             continue
-        expected = netpbm("pnmtoplainpnm", data=netpbm("pnmtopnm", data=netpbm("ppmtoppm", data=netpbm("bmptopnm", str(source)))))
+        expected = netpbm("pnmtoplainpnm", data=netpbm("pnmtopnm",
+                                                       data=netpbm("ppmtoppm", data=netpbm("bmptopnm", str(source)))))
         written = convert(source, "ppm", folder)
         if netpbm("pnmtoplainpnm", data=written.read_bytes()) != expected:
             print(f"{name}: netpbm sees another picture")
@@ -40,7 +43,8 @@ with tempfile.TemporaryDirectory() as folder:
         plain = Path(folder) / ("plain-" + source.stem + ".ppm")
         plain.write_bytes(expected)
         again = convert(plain, "bmp", folder)
-        if netpbm("pnmtoplainpnm", data=netpbm("ppmtoppm", data=netpbm("bmptopnm", str(again)))) != expected:
+        if netpbm("pnmtoplainpnm", data=netpbm("ppmtoppm",
+                                               data=netpbm("bmptopnm", str(again)))) != expected:
             print(f"{name}: the plain file reads as another picture")
             failed += 1
 print("netpbm and the plug-in agree" if failed == 0 else f"{failed} failed")

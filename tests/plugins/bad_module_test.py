@@ -21,13 +21,18 @@ def install(folder, oddity):
     """A program of its own in `folder`, with one module beside it."""
     (folder / "plugin").mkdir()
     (folder / "data").mkdir()
-    os.link(FOTOMILL, folder / "fotomill") if FOTOMILL.stat().st_dev == folder.stat().st_dev else shutil.copy(FOTOMILL, folder)
+    if FOTOMILL.stat().st_dev == folder.stat().st_dev:
+        os.link(FOTOMILL, folder / "fotomill")
+    else:
+        shutil.copy(FOTOMILL, folder)
     shutil.copy(MODULES / oddity / "FMWPL_odd.so", folder / "plugin" / "FMWPL_odd.so")
 
 
 def run(folder, *arguments):
-    result = subprocess.run([folder / "fotomill", "--data", folder / "data", *arguments], cwd=folder, capture_output=True,
-                            stdin=subprocess.DEVNULL, env={**os.environ, "TMPDIR": str(folder), "LC_ALL": "C"}, timeout=60)
+    result = subprocess.run([folder / "fotomill", "--data", folder / "data", *arguments],
+                            cwd=folder, capture_output=True,
+                            stdin=subprocess.DEVNULL, env={**os.environ, "TMPDIR": str(folder),
+                                                           "LC_ALL": "C"}, timeout=60)
     return result.returncode, result.stdout.decode(), result.stderr.decode()
 
 
@@ -40,7 +45,8 @@ def test_working(folder, oddity, status):
     check(f"{oddity}: results", found[1], "first.odd -> first.bmp\n")
     check(f"{oddity}: message", found[2], "fotomill: The plug-in FMWPL_odd.so ended the program.\n")
     left = sorted(path.name for path in folder.iterdir())
-    check(f"{oddity}: files", left, ["data", "first.bmp", "first.odd", "fotomill", "last.odd", "plugin"])
+    check(f"{oddity}: files", left, ["data", "first.bmp", "first.odd", "fotomill", "last.odd",
+                                     "plugin"])
     check(f"{oddity}: the others are read again", run(folder, "verify", "first.odd")[0], 0)
 
 
@@ -49,7 +55,8 @@ def test_loading(folder):
     module = folder / "plugin" / "FMWPL_odd.so"
     status, out, error = run(folder, "formats", "--filter")
     check("loading: status", status, 1)
-    check("loading: message", error, "fotomill: The plug-in FMWPL_odd.so ended the program. It will not be loaded again.\n")
+    check("loading: message", error,
+          "fotomill: The plug-in FMWPL_odd.so ended the program. It will not be loaded again.\n")
     status, out, error = run(folder, "formats", "--filter")
     check("loading again", (status, "*.BMP" in out, error), (0, True, ""))
     if "FMWPL_odd.so" not in run(folder, "doctor")[1]:
@@ -61,12 +68,15 @@ def test_loading(folder):
 def test_number(folder):
     install(folder, "ERROR_42")
     (folder / "x.odd").write_bytes(b"")
-    check("number", run(folder, "info", "x.odd")[2].split("\n")[0], "x.odd: error 42 of the plug-in")
-    if '"status":42,"message":"error 42 of the plug-in"' not in run(folder, "info", "--json", "x.odd")[1]:
+    check("number", run(folder, "info", "x.odd")[2].split("\n")[0],
+          "x.odd: error 42 of the plug-in")
+    if '"status":42,"message":"error 42 of the plug-in"' not in run(folder, "info", "--json",
+                                                                    "x.odd")[1]:
         faults.append("the number has no message in JSON")
 
 
-for test, arguments in [(test_working, ("EXITS", 1)), (test_working, ("CRASHES", -11)), (test_loading, ()), (test_number, ())]:
+for test, arguments in [(test_working, ("EXITS", 1)), (test_working, ("CRASHES", -11)),
+                        (test_loading, ()), (test_number, ())]:
     with tempfile.TemporaryDirectory(dir=FOTOMILL.parent) as place:
         test(Path(place), *arguments)
 print("\n".join(faults) if faults else "modules that end the program are named")

@@ -243,7 +243,8 @@ TEST(LoadPicture, OpensByContentsWhatTheNameHides) {
   for (const auto& row : rows) {
     SCOPED_TRACE(row.name);
     write(row.made, row.name);
-    const ReadRequest request{.fileName = folder.Path(row.name), .options = {.identify = row.identify}};
+    const ReadRequest request{.fileName = folder.Path(row.name),
+                              .options = {.identify = row.identify}};
     PicturePointer picture;
     EXPECT_EQ(LoadPicture(request, picture), row.status);
     ASSERT_EQ(picture != nullptr, row.status == Status::Ok);
