@@ -39,7 +39,7 @@ bool LeadsUp(std::string_view path) {
 
 bool IsFileName(std::string_view name) { return !name.empty() && name != "." && IsPlainName(name); }
 
-// Asks until the name can be taken or nobody wants one. The extension stays the format's, cased
+// Asks until the name can be used or the user gives up. The extension stays the format's, cased
 // after the source's.
 bool AskName(Destination& destination, const std::string& source, std::string_view title,
              BatchJob& job) {

@@ -34,9 +34,9 @@ struct FitRequest {
 bool HoldsProfile(const FormatEntry& row);
 
 // Makes a picture look the same in a file of the format: if the EXIF orientation cannot go along,
-// the pixels are turned; if the color profile cannot, or does not suit the pixels, the colors become
-// sRGB. UnsuitableImage (13) if a profile is given that the format cannot hold, with the reason in
-// `hint`; MemoryAllocationError (6) leaves the picture whole.
+// the pixels are turned; if the color profile cannot, or does not suit the pixels, the colors
+// become sRGB. UnsuitableImage (13) if a profile is given that the format cannot hold, with the
+// reason in `hint`; MemoryAllocationError (6) leaves the picture whole.
 Status FitPicture(PictureRecord& picture, const FormatEntry& row, const FitRequest& request,
                   std::string& hint);
 

@@ -26,7 +26,7 @@ class Prompts;
 // What happens to an output whose name is taken. Answers of the overwrite prompt change it.
 struct OverwritePolicy {
   bool prompt = true;    // ask; without it the file that is there is replaced
-  bool keepBoth = true;  // what a prompt is answered with that nobody is shown: a numbered variant
+  bool keepBoth = true;  // the answer to prompts that cannot be shown: a numbered variant
   bool recycle = false;  // a file that is replaced goes to the recycle bin
   bool previews = true;  // in the prompt
   bool skip = false;     // leave out the file, without a question

@@ -42,7 +42,7 @@ struct DirectoryForm {
 // the limits, is left out.
 ExifDirectories GatherExif(std::span<const uint8_t> file, const DirectoryForm& form,
                            uint64_t offset);
-// The same of a block from its byte order on; empty for what is none.
+// The same of a block from its byte order on; empty if it is invalid.
 ExifDirectories ParseExifBlock(std::span<const uint8_t> block);
 
 // A block of its own, in the set's byte order.

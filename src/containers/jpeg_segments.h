@@ -78,7 +78,7 @@ struct JpegHead {
   // "MPF").
   bool HasMorePictures() const;
 };
-// DamagedFile (2) when the file is none, FileReadError (3) when it ends before its first scan.
+// DamagedFile (2) if it is not a JPEG file, FileReadError (3) when it ends before its first scan.
 Status ParseJpegHead(std::span<const uint8_t> file, JpegHead& head);
 
 // A new file from the application segments and comments of an old one and from other pixels.

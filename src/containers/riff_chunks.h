@@ -19,7 +19,7 @@ struct RiffPlace {
   uint64_t data = 0, size = 0;
 };
 
-// Walks the chunks of a RIFF file to the end of the file, whatever length its head tells.
+// Walks the chunks of a RIFF file to the end of the file, whatever length its header claims.
 class RiffWalk {
  public:
   explicit RiffWalk(WalkedBytes file) : file_(file) {}

@@ -147,7 +147,7 @@ Outcome DoStep(FileOperationKind kind, const FileStep& step, const FileOperation
   return TrashOne(step.from);
 }
 
-// A copy that somebody has worked on since stays.
+// A copy that was edited since is kept.
 Outcome RemoveCopy(const FileStep& step) {
   const platform::FileFacts copy = platform::FactsOf(step.to),
                             original = platform::FactsOf(step.from);

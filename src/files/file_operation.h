@@ -15,7 +15,7 @@ enum class FileOperationKind {
   Move,
   Copy,
   Trash,
-  Create,  // a function wrote `to` from `from`, in nobody's place
+  Create,  // a function wrote `to` from `from`; no file was replaced
   Turn,    // the picture in `from` was rotated or flipped
 };
 
@@ -99,7 +99,7 @@ class UndoList {
   std::string RedoName() const {
     return CanRedo() ? FileOperationName(undone_.back()) : std::string();
   }
-  // Hands out what is to be undone or redone; the result comes back by Undone or Redone.
+  // Hands out the step to undo or redo; the result comes back by Undone or Redone.
   FileOperation PopUndo();
   FileOperation PopRedo();
   void Undone(FileOperation operation);

@@ -21,7 +21,7 @@ class PreviousFile {
   [[nodiscard]] bool Keep(const std::string& path);
   // The file was replaced; what it is now is remembered.
   void Replaced(const std::string& path) { replaced_ = platform::StampOf(path); }
-  // Whether somebody else has changed the file since it was replaced.
+  // Whether another program has changed the file since it was replaced.
   bool HasChanged(const std::string& path) const;
   void Swap(PreviousFile& other) { kept_.Swap(other.kept_); }
   const std::string& Path() const { return kept_.Path(); }
@@ -40,7 +40,7 @@ class PreviousFiles {
   // To be called before a file is replaced. False: it should not be.
   [[nodiscard]] bool Keep(const std::string& path);
   // To be called at once when a file that was kept has been replaced; what it becomes later is
-  // somebody else's work.
+  // another program's work.
   void Replaced(const std::string& path);
   // The operation of those that were replaced, in the order of their paths; they are handed over.
   FileOperation Operation();

@@ -22,7 +22,7 @@ std::string RecordOf(const RenamedFile& file) {
   return record;
 }
 
-// Takes a text up to its zero byte off; false if there is none.
+// Splits off the text up to the next zero byte; false if there is no zero byte.
 bool TakeText(std::string_view& contents, std::string& text) {
   const size_t end = contents.find('\0');
   if (end == std::string_view::npos) return false;

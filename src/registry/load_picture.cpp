@@ -30,7 +30,7 @@ bool IsExcepted(std::string_view fileName, std::string_view exceptions) {
   return false;
 }
 
-// Whether a row may have refused a file because it is none of its own.
+// Whether a status may mean that the file is of another format.
 bool IsRefusal(Status status) {
   return status != Status::Ok && status != Status::FileOpenError &&
          status != Status::MemoryAllocationError && status != Status::FunctionCancelled;
@@ -84,7 +84,8 @@ bool OpenedByContents(const PictureRecord& picture) {
   if (picture.formatIndex != kSpareRow)
     return picture.formatIndex != FindFormatByName(picture.fileName);
   // A look at the name might bind the spare row to another plug-in.
-  return !EqualIgnoringCase(FormatRow(kSpareRow).extension, platform::ExtensionOf(picture.fileName));
+  return !EqualIgnoringCase(FormatRow(kSpareRow).extension,
+                            platform::ExtensionOf(picture.fileName));
 }
 
 Status LoadPicture(const ReadRequest& request, PicturePointer& picture, void* window) {

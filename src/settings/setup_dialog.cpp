@@ -127,7 +127,7 @@ std::string ValueIn(const SetupDialog& dialog, const DestinationSource& destinat
 ControlValue ReadControl(const SetupDialog& dialog, const DestinationSource& destinations,
                          const KeyRow& row) {
   ControlValue control{&row, ValueIn(dialog, destinations, row), {}};
-  if (control.text == ValueText(row)) return control;  // whatever it is, it was there before
+  if (control.text == ValueText(row)) return control;  // unchanged
   const SettingValue value = ReadValue(row, control.text, ValueSource::Person);
   if (!value.usable) {
     control.fault = FaultMessage(row, value.fault);

@@ -57,7 +57,7 @@ struct HistoryOptions {
   std::string name = "FMWFileHistoryDatabase";  // of the file, without extension
 };
 
-// Its name as lists show it; empty for a number that is none.
+// Its name as lists show it; empty for an unknown number.
 std::string_view FileFunctionName(int32_t function);
 // The function of a name, whatever its case; kNoFileFunction if there is none.
 int32_t FileFunctionOfName(std::string_view name);

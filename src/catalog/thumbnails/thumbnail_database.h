@@ -92,7 +92,7 @@ class ThumbnailDatabase {
   enum class Opened {
     Done,
     Missing,
-    NotRead,  // it cannot be opened, or is none: it was left alone
+    NotRead,  // it cannot be opened or is no database: left alone
     Failed,   // it could not be made
   };
   // Opens the database of that path; with `create`, one that is missing is made with an empty

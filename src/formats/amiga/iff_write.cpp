@@ -1,4 +1,4 @@
-// The writer of Amiga interchange files. What it chooses is told in iff.cpp.
+// The writer of Amiga interchange files. Its choices are described in iff.cpp.
 #include <algorithm>
 #include <array>
 #include <memory>

@@ -258,7 +258,7 @@ int32_t RowsPerChunk(uint64_t stride) {
   return static_cast<int32_t>(std::max<uint64_t>(kChunkSize / stride, 1));
 }
 
-// Rows that lie in the file as in the picture go straight into it.
+// Rows stored as in memory are copied directly.
 Status ReadRowsUnchanged(const platform::FileView& file, const BmpHeader& header,
                          const PictureRecord& picture, PackedImage& image) {
   const int32_t height = image.Height();

@@ -22,7 +22,7 @@ void ForVisibleRows(const GifFrame& frame, const Canvas& canvas, Visit visit) {
   }
 }
 
-// Where row y of a frame stands in its data.
+// The position of row y of a frame in its data.
 std::vector<int32_t> RowOrder(const GifFrame& frame) {
   std::vector<int32_t> order(static_cast<size_t>(frame.height));
   for (int32_t r = 0; r < frame.height; ++r) {

@@ -134,7 +134,7 @@ HdpEntry TakeEntry(ByteReader& bytes) {
   return entry;
 }
 
-// The bytes of an entry of single bytes; empty when they do not lie in the file.
+// The bytes of an entry of single bytes; empty if they are outside the file.
 std::span<const uint8_t> BytesOf(std::span<const uint8_t> file, const HdpEntry& entry) {
   const uint64_t offset = entry.count <= 4 ? entry.place : entry.value;
   return offset <= file.size() && entry.count <= file.size() - offset

@@ -64,7 +64,7 @@ class Directory {
       out.Zeros(entry.block.size() % 2);
     }
   }
-  // Where the value of a written entry lies in the file, for those that are known only later.
+  // Offset of the value of a written entry, for values that are known only later.
   uint64_t PlaceOf(uint16_t tag) const {
     return std::find_if(entries_.begin(), entries_.end(),
                         [tag](const Entry& entry) { return entry.tag == tag; })
@@ -146,7 +146,7 @@ Status WriteAll(ByteWriter& out, PictureRecord& picture, const WriteOptions& opt
   const bool gray = HasOnlyGrays(picture.palette, picture.image.Colors());
   PackedImage source;
   RETURN_IF_BAD(MakeSource(picture, gray, source));
-  // The EXIF directories stand in front, where their place is known, then the file's own.
+  // The EXIF directories come first, where their offset is known, then the file's own.
   HdpMetadata extra;
   if (keep) extra.exif = ParseExifBlock(picture.metadata.exif);
   if (keep && extra.exif.Empty() && !picture.metadata.exif.empty())

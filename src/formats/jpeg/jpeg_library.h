@@ -52,7 +52,7 @@ struct JpegReader {
 
   JpegErrors errors;
   jpeg_decompress_struct info = {};
-  // ends files of absurdly many scans, and those that nobody wants any more
+  // stops files with too many scans, and decodes that are no longer needed
   jpeg_progress_mgr monitor = {};
   StopToken stop = {};
   std::vector<JpegSegment> segments;  // those kept, in the order of the file

@@ -1,4 +1,4 @@
-// Paint Shop Pro images (PSP). How a file is laid out is told in psp_file.cpp.
+// Paint Shop Pro images (PSP). The file layout is described in psp_file.cpp.
 //
 // The first page is the whole picture: the composite that later versions store, where it is
 // lossless, else the visible layers laid one on the other. Further pages are the layers, where

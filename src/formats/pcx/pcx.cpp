@@ -17,7 +17,7 @@
 //   end - 769    12 and a palette of 256 colors, with 8 bits
 //
 // Palettes are red, green, blue. A byte of 0xC0 or more counts in its low six bits how often the
-// byte after it comes; any other byte stands for itself.
+// byte after it comes; any other byte is a literal.
 //
 // The reader carries runs on from line to line, and takes two bits in one plane (CGA) beside the
 // combinations that it writes. The writer codes every plane of every line on its own, and leaves

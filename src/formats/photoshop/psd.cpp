@@ -1,4 +1,4 @@
-// Photoshop documents (PSD, PDD): their pictures. How a file is laid out is told in psd_file.cpp.
+// Photoshop documents (PSD, PDD): their pictures. The file layout is described in psd_file.cpp.
 //
 // The reader shows the merged picture. Where the program stored none, each layer that holds pixels
 // is a page, from the bottom up, in its place on the canvas. Bitmap, gray, indexed, RGB, CMYK, Lab;

@@ -1,4 +1,4 @@
-// Macintosh pictures (PICT): the pixels in them. How a file is laid out is told in pict_file.cpp.
+// Macintosh pictures (PICT): the pixels in them. The file layout is described in pict_file.cpp.
 //
 // A picture that holds one piece of pixels is shown as that piece, with its own palette or in 24
 // bits. Several are drawn where they belong in the frame, stretched where the picture says so.
@@ -22,7 +22,7 @@ namespace {
 
 constexpr uint64_t kMostOverdraw = 64;  // how often the pieces of one picture may cover all of it
 
-// The stored rectangle of pixels that is drawn; all of them where the picture names none that fits.
+// The stored rectangle of pixels that is drawn; all of them if the picture names none that fits.
 Rectangle Shown(const PictPixels& pixels) {
   const Rectangle& all = pixels.bounds;
   const Rectangle& part = pixels.source;

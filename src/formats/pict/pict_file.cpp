@@ -131,7 +131,7 @@ uint64_t PackedSize(ByteReader rows, size_t height, bool longCounts) {
   return rows.Ok() ? rows.Position() - begin : left + 1;
 }
 
-// The rows, which `pixels` tells how to find.
+// The rows, at the place that `pixels` names.
 void TakeRows(ByteReader& bytes, PictPixels& pixels) {
   const auto height = static_cast<size_t>(std::max(pixels.bounds.height, 0));
   if (!pixels.packed) {

@@ -81,8 +81,8 @@ struct PngLayout {
   RowForm rows = RowForm::Direct;
 };
 
-// Whether the chunks in front of the pixels lie in the file: for one that only claims a size the
-// library would make room.
+// Whether the chunks in front of the pixels are within the file: for one that only claims a size
+// the library would make room.
 Status CheckHead(std::span<const uint8_t> file) {
   PngWalk walk(file);
   for (PngPlace chunk; walk.Next(chunk);) {
@@ -480,7 +480,7 @@ void AddChunkLines(std::span<const uint8_t> file, DetailLines& lines) {
   lines.AddFormat("       Chunks: %d, %d of pixels", count, pixels);
 }
 
-// Whether there are texts that somebody wrote, beside those that travel with the picture; programs
+// Whether there are texts written by a person, beside those that travel with the picture; programs
 // write the others.
 bool HoldsFurtherTexts(std::span<const uint8_t> file) {
   constexpr std::string_view kOthers[] = {kPngXmpKeyword, "Comment", "Software", "Creation Time"};

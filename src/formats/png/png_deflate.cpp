@@ -159,7 +159,7 @@ class BandQueue {
   BandQueue(const BandQueue&) = delete;
   BandQueue& operator=(const BandQueue&) = delete;
 
-  // Band `index`, made here when nobody has begun it; it lives until the next one is taken. Bands
+  // Band `index`, made here if no thread has begun it; valid until the next call. Bands
   // are taken in order, each once.
   Band& Take(int32_t index) {
     std::unique_lock lock(mutex_);

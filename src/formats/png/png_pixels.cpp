@@ -42,7 +42,7 @@ bool FindPixelChunks(std::span<const uint8_t> file, std::vector<std::span<const 
   return false;
 }
 
-// The parts as one, without a copy where there is only one.
+// The parts as one span; no copy is made of a single part.
 bool Join(const std::vector<std::span<const uint8_t>>& parts, uint64_t size,
           platform::MemoryBlock& copy, std::span<const uint8_t>& joined) {
   joined = parts[0];

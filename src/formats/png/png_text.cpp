@@ -23,7 +23,7 @@ struct DecompressorDeleter {
   }
 };
 
-// Tries larger and larger rooms: nothing tells how long the text is.
+// Tries ever larger buffers: the length of the text is not stored.
 std::vector<uint8_t> Inflated(std::span<const uint8_t> data, uint64_t most) {
   constexpr uint64_t kFirst = 16 * 1024;
   const std::unique_ptr<libdeflate_decompressor, DecompressorDeleter> decompressor(
@@ -65,7 +65,7 @@ std::vector<uint8_t> PngTextOf(const PngChunk& chunk, uint64_t most) {
   bool deflated = chunk.type == "zTXt";
   const size_t head = chunk.type == "iTXt" ? 2 : deflated ? 1 : 0;
   if (text.size() < head) return {};
-  if (head > 0 && text[head - 1] != 0) return {};  // a method that nobody knows
+  if (head > 0 && text[head - 1] != 0) return {};  // an unknown compression method
   if (chunk.type == "iTXt") deflated = text[0] != 0;
   text = text.subspan(head);
   if (chunk.type == "iTXt") text = BehindZero(BehindZero(text));

@@ -15,7 +15,7 @@
 //      bytes each), then the length of each, then the rows' code
 //
 // Channels are gray, gray and alpha, RGB, or RGB and alpha; more are passed over. Samples of two
-// bytes come down to one, rounded. Rows may share their code and lie in any order.
+// bytes come down to one, rounded. Rows may share their code and be in any order.
 //
 // The writer stores run lengths of one byte a sample: pictures of the gray ramp in one channel,
 // everything else in three, and a channel of alpha where the picture has some. Source: P. Haeberli,
@@ -94,7 +94,7 @@ void DescribePicture(const SgiHeader& header, PictureRecord& picture) {
   }
 }
 
-// Where the samples of each row of each channel lie in the file.
+// File offsets of the samples of each row of each channel.
 class RowTable {
  public:
   // FileReadError when the file is too short for what it holds.

@@ -391,7 +391,7 @@ void WriteRow(const PictureRecord& picture, int32_t r, const TgaLayout& layout,
   }
 }
 
-// What stands in front of the pixels, and the picture's facts from it.
+// Reads what precedes the pixels, and fills in the picture's facts.
 Status TakeHead(std::span<const uint8_t> file, TgaHeader& header, ColorMap& map,
                 PictureRecord& picture) {
   RETURN_IF_BAD(ParseHeader(file, header));

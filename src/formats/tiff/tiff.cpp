@@ -248,7 +248,7 @@ bool HoldsFurtherTags(TIFF* tiff) {
   return false;
 }
 
-// Where the directories of the pages are, as many as lie in the file, up to the limit. A second
+// Offsets of the page directories within the file, up to the limit. A second
 // visit ends the chain; a look at those visited is only needed where it goes back.
 std::vector<uint64_t> PageOffsets(const TiffInput& input) {
   const bool big = TIFFIsBigTIFF(input.Handle()) != 0;

@@ -14,7 +14,7 @@ namespace {
 
 TiffMessages& MessagesOf(void* user) { return *static_cast<TiffMessages*>(user); }
 
-// Both return 1: the message has been dealt with, nobody else is to print it.
+// Both return 1: the message is handled and must not be printed.
 int OnError(TIFF*, void* user, const char*, const char* format, va_list arguments) {
   TiffMessages& messages = MessagesOf(user);
   if (messages.error[0] == 0)
@@ -22,7 +22,7 @@ int OnError(TIFF*, void* user, const char*, const char* format, va_list argument
   return 1;
 }
 
-// What the library finds odd in directories harms nobody; and old LZW codes are no fault.
+// Warnings about directories are harmless, and old-style LZW codes are valid.
 int OnWarning(TIFF*, void* user, const char* module, const char* format, va_list arguments) {
   TiffMessages& messages = MessagesOf(user);
   const bool counts =

@@ -6,7 +6,7 @@
 
 namespace fotomill {
 
-// The part of `area` that is on a picture of that size; width and height 0 if there is none.
+// The part of `area` that is on a picture of that size; width and height 0 if they do not overlap.
 Rectangle Clipped(const Rectangle& area, int32_t width, int32_t height);
 
 // A copy of part of an image, which must be within it; depth and colors stay. Statuses as

@@ -35,8 +35,8 @@ constexpr int32_t PatternSize(Dither dither) {
 
 // Each pixel takes the color nearest to it.
 void MapRow(const uint8_t* bgr, int32_t width, NearestColor& nearest, uint8_t* indices);
-// An ordered dither. `y` chooses the row of the threshold pattern of `size` x `size`; `spread` is the distance of two
-// colors that it is to bridge.
+// An ordered dither. `y` chooses the row of the threshold pattern of `size` x `size`; `spread` is
+// the distance of two colors that it is to bridge.
 void OrderRow(const uint8_t* bgr, int32_t width, int32_t y, int32_t size, int32_t spread,
               NearestColor& nearest, uint8_t* indices);
 // The same between black and white.

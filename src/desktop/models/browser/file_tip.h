@@ -10,7 +10,7 @@ namespace fotomill::desktop {
 
 // What a tip tells of one line of a browser: name, type, size and date, dimensions and depth,
 // comment. Reads the file's header; any thread. `known` is why the picture could not be shown, Ok
-// when nobody knows of a reason.
+// if the reason is unknown.
 std::vector<std::string> FileTipLines(const std::string& folder, const FolderItem& item,
                                       Status known);
 

@@ -15,8 +15,8 @@ struct FolderItem {
   int32_t format = -1;  // row of the registry
   uint64_t size = 0;
   int64_t modified = 0;                     // seconds since 1970-01-01 UTC
-  int32_t width = 0, height = 0, bits = 0;  // 0 until somebody has read the file's header
-  // the EXIF date as a number that sorts, 0 without one or before somebody has read it
+  int32_t width = 0, height = 0, bits = 0;  // 0 until the file's header is read
+  // the EXIF date as a number that sorts, 0 without one or before it is read
   int64_t taken = 0;
 
   bool operator==(const FolderItem&) const = default;

@@ -16,9 +16,11 @@ namespace {
 using enum SetupPage;
 using enum KeyNumber;
 
-// clang-format off
-constexpr SetupItem Item(SetupPage page, const char* group, KeyNumber key, const char* label) { return {page, group, key, label}; }
+constexpr SetupItem Item(SetupPage page, const char* group, KeyNumber key, const char* label) {
+  return {page, group, key, label};
+}
 
+// clang-format off
 constexpr SetupItem kItems[] = {
     Item(Browsing,   TrLater("Start"),              RememberOpenWindows,            "Reopen the tabs of the last session"),
     Item(Browsing,   TrLater("New browsers"),       DefaultViewMode,                "Show files as"),

@@ -17,7 +17,7 @@ namespace {
 constexpr const char* kFile = "FMWFavourites.txt";
 constexpr size_t kMostFolders = 200;
 
-// Changes the list as it is in the file now. The list afterwards; as it was when the file cannot be
+// Changes the list as it is in the file now. The list afterwards; unchanged if the file cannot be
 // written.
 bool EditList(std::vector<std::string>& folders,
               const std::function<void(std::vector<std::string>&)>& edit) {

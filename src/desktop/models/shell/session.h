@@ -43,7 +43,7 @@ Session ParseSession(std::string_view text);
 // Tabs whose folder cannot be on a line are left out.
 std::string SessionText(const Session& session);
 
-// The session of the last run, without tabs whose folder has gone. Empty if there is none.
+// The session of the last run, without tabs whose folder is missing. Empty if there is none.
 Session LoadSession();
 // False when it could not be written.
 bool SaveSession(const Session& session);

@@ -125,7 +125,7 @@ Status PixelsOfPicture(PictureRecord& picture, const ThumbnailRequest& request, 
   return ScaleDown(picture.image, request.side, pixels);
 }
 
-// A thumbnail that somebody has made before.
+// A thumbnail that was made earlier.
 bool ReadReady(const ThumbnailRequest& request, Thumbnail& thumbnail) {
   ThumbnailRecord record;
   if (FindRecord(request, record) &&

@@ -30,7 +30,7 @@ class ThumbnailOffer : public std::enable_shared_from_this<ThumbnailOffer> {
 
   // The answer: one of the choices, or 0.
   void Answer(int32_t choice);
-  // Nobody is interested any more.
+  // The offer is withdrawn.
   void Stop();
 
  private:

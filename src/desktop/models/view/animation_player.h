@@ -25,7 +25,7 @@ class AnimationPlayer {
   // The size that frames are decoded for, in pixels.
   void Fit(int32_t width, int32_t height) { frames_.Fit(width, height); }
 
-  // What is to be shown at this time; null while that is not decoded yet. Asked too early it is the
+  // The frame to show at this time; null while it is not decoded yet. Asked too early it is the
   // frame shown already.
   ViewPicturePointer At(double now);
   // Seconds until At moves on; negative when it never does by itself: paused, at the end, or

@@ -118,7 +118,7 @@ void BatchRunner::BatchProgress(uint32_t done, uint32_t count) {
   if (box_ != nullptr) box_->SetProgress(done, count);
 }
 
-// Whether the user saw the end is told before the box moves the keyboard.
+// Checks whether the user saw the end before the box takes the focus.
 void BatchRunner::BatchStaysOpen(const ProgressModel& model) {
   seen_ = InFront();
   LogEvent("batch", "stays-open files=" + std::to_string(model.Files()));

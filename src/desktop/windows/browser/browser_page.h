@@ -58,7 +58,7 @@ class BrowserPage : public wxPanel {
   void GoForward() { StepAlongTrail(1); }
   void GoUp();  // to the parent folder
 
-  // What the browser shows. After a change of its selection, SelectionChanged is to be called.
+  // What the browser shows. After changing its selection, call SelectionChanged.
   const BrowserModel& Model() const { return model_; }
   BrowserModel& Model() { return model_; }
   // By choice::ViewMode, choice::ThumbnailMode and choice::SortMode; the folder's view is kept as

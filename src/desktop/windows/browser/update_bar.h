@@ -9,7 +9,7 @@ class wxStaticText;
 
 namespace fotomill::desktop {
 
-// The offer to make missing thumbnail files, as a bar that stands in nobody's way.
+// The offer to make missing thumbnail files, as a bar that blocks nothing.
 class UpdateBar : public wxPanel {
  public:
   // `answered` gets the choice that was made, 0 when the bar was closed.

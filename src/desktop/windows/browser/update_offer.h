@@ -20,7 +20,7 @@ class UpdateOffer {
  public:
   // What the browser has to follow.
   struct Events {
-    std::function<void()> answered;  // the bar has gone
+    std::function<void()> answered;  // the bar was closed
     std::function<void()> made;      // there are new thumbnails
   };
   UpdateOffer(wxWindow* parent, Events events);

@@ -19,7 +19,7 @@ class Shell;
 // to the pane with the focus.
 class CompareFrame : public wxFrame {
  public:
-  // Whether so many files can be compared.
+  // Whether that number of files can be compared.
   static constexpr bool CanShow(size_t files) { return files >= 2 && files <= 4; }
 
   CompareFrame(Shell& shell, const std::vector<std::string>& files);

@@ -100,7 +100,7 @@ class FinderBox : public wxDialog {
 void FindCommand(Shell& shell) {
   FinderBox box(&shell.Window());
   if (box.ShowModal() != wxID_OK || box.Chosen() == wxID_NONE) return;
-  // Once the box has gone, so that the command finds the frame as it was.
+  // After the box is closed, so that the command runs on the frame behind it.
   shell.Window().CallAfter([&shell, id = box.Chosen()] { shell.Window().ProcessCommand(id); });
 }
 

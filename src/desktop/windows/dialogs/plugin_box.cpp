@@ -83,7 +83,7 @@ PluginBox::PluginBox(wxWindow* parent)
 }
 
 void PluginBox::FillList() {
-  (void)PluginFormats();  // modules are loaded when somebody asks
+  (void)PluginFormats();  // loads the modules
   for (const PluginModule& module : PluginModules()) AddModule(module);
   int selected = lines_.empty() ? wxNOT_FOUND : 0;
   for (size_t line = 0; line < lines_.size(); ++line) {

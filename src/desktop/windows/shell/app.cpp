@@ -104,7 +104,7 @@ class App : public wxApp {
     return true;
   }
 
-  // The log is told which window has the keyboard.
+  // Logs which window has the keyboard focus.
   int FilterEvent(wxEvent& event) override {
     if (EventLogOn() && event.GetEventType() == wxEVT_ACTIVATE &&
         static_cast<wxActivateEvent&>(event).GetActive()) {

@@ -75,7 +75,7 @@ void ViewAnimation::End() {
   if (player_ == nullptr) return;
   shown_.reset();
   *alive_ = false;
-  // Nobody waits for the frame that is being decoded.
+  // The frame being decoded is no longer needed.
   (void)RunLoose([player = std::shared_ptr<AnimationPlayer>(std::move(player_))]() mutable { player.reset(); });
 }
 

@@ -22,7 +22,7 @@ class ViewAnimation {
   struct Events {
     // another frame is on the canvas, or the animation plays or pauses
     std::function<void()> changed;
-    // a frame as it is to be shown; null if it cannot be
+    // a frame prepared for display; null if it cannot be
     std::function<ViewPicturePointer(const ViewPicturePointer&)> dressed;
   };
 
@@ -41,7 +41,7 @@ class ViewAnimation {
   // In full screen there is the picture alone.
   void HideBar(bool hide);
   void Toggle();  // plays or pauses
-  void Step(int frames);  // pauses, and shows the frame so many on or back
+  void Step(int frames);  // pauses, and moves by that number of frames
   void Resized();
   // Frames are to be shown in another way.
   void ShowAgain();

@@ -248,7 +248,7 @@ void ViewFrame::ShowTurned() {
   canvas_->Show(std::move(turned));
 }
 
-// A picture, or a frame of it, as it is to be shown; null where there is no memory for that.
+// A picture, or a frame of it, prepared for display; null if memory runs out.
 ViewPicturePointer ViewFrame::Turned(const ViewPicturePointer& picture) const {
   const bool turns = turn_ != Orientation::Upright && picture->picture != nullptr;
   return turns ? TurnedView(*picture, turn_) : picture;

@@ -28,7 +28,7 @@ class ViewSlideshow {
   bool Running() const { return order_.has_value(); }
   // This place is on the screen, from now on for its seconds.
   void ShownAt(size_t place, size_t count);
-  // The place that is to be decoded ahead beside the neighbours.
+  // The position to decode ahead in addition to the neighbors.
   std::optional<size_t> Upcoming() const { return Running() ? order_->Upcoming() : std::nullopt; }
   // Asks for other choices and keeps them for the next time. False when that was cancelled.
   bool Choose(wxWindow& parent);
