@@ -99,7 +99,7 @@ class StreamBuilder {
   std::vector<uint8_t>& out_;
 };
 
-// Data that are cut short are taken as far as they go; the decoder tells.
+// FileReadError when the data are not all there.
 Status BuildPicture(std::span<const uint8_t> area, CamFile& cam) {
   ByteReader bytes(area);
   bytes.Skip(2);
@@ -108,22 +108,21 @@ Status BuildPicture(std::span<const uint8_t> area, CamFile& cam) {
   if (!bytes.Ok()) return Status::FileReadError;
   StreamBuilder stream(cam.built);
   stream.Quantizers(quantizers);
-  const auto take = [&](uint64_t length) { return bytes.Take(std::min(length, bytes.Left())); };
   // the chromas of 480 x 240 cannot be without data
   if (lengths[1] >= 8 && lengths[2] >= 8) {
     cam.narrow = true;
     stream.Frame(480, 240, 0x32);
     for (uint8_t i = 0; i < 3; ++i) {
       const auto component = static_cast<uint8_t>(i + 1);
-      stream.Scan(component, component, take(lengths[i]));
+      stream.Scan(component, component, bytes.Take(lengths[i]));
     }
   } else {
     stream.Frame(640, 480, 0x22);
-    stream.Scan(1, 3, take(uint64_t{lengths[1]} << 16 | lengths[2]));
+    stream.Scan(1, 3, bytes.Take(uint64_t{lengths[1]} << 16 | lengths[2]));
   }
   stream.End();
   cam.jpeg = cam.built;
-  return Status::Ok;
+  return bytes.Ok() ? Status::Ok : Status::FileReadError;
 }
 
 std::string CommentOf(std::span<const uint8_t> area) {
@@ -144,10 +143,12 @@ Status ParseCam(std::span<const uint8_t> file, CamFile& cam) {
   ByteReader content(file);
   content.Seek(6 + 16 * uint64_t{cam.areas});
   std::span<const uint8_t> picture;
+  bool cutShort = false;
   for (uint16_t i = 0; i < cam.areas && content.Ok() && cam.jpeg.empty(); ++i) {
     const uint16_t number = table.Be16();
     const uint32_t length = table.Be32();
     table.Skip(10);
+    cutShort = cutShort || length > content.Left();
     const auto area = content.Take(std::min<uint64_t>(length, content.Left()));
     if (number == kComment) cam.comment = CommentOf(area);
     if (number == kPicture) picture = area;
@@ -156,7 +157,7 @@ Status ParseCam(std::span<const uint8_t> file, CamFile& cam) {
   if (cam.jpeg.empty() && file.size() > kUsualHead && BeginsJpeg(file.subspan(kUsualHead)))
     cam.jpeg = file.subspan(kUsualHead);
   if (!cam.jpeg.empty()) return Status::Ok;
-  if (!content.Ok()) return Status::FileReadError;
+  if (!content.Ok() || (cutShort && picture.empty())) return Status::FileReadError;
   return picture.empty() ? Status::NoImages : BuildPicture(picture, cam);
 }
 
