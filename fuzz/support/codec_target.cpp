@@ -19,8 +19,10 @@ uint32_t Hash(const uint8_t* data, size_t size) {
   return hash;
 }
 
-void Write(const WriteOperation write, PictureRecord& picture, const EncodeOptions& encode) {
-  static const std::string path = ScratchPath("out");
+// Some writers decide by the extension of their file.
+void Write(const WriteOperation write, PictureRecord& picture, const char* extension,
+           const EncodeOptions& encode) {
+  static const std::string path = ScratchPath(std::string("out.") + extension);
   picture.fileName.AssignCut(path);
   (void)write(picture, {.encode = encode});
   unlink(path.c_str());
@@ -34,6 +36,8 @@ void TryCodec(const char* extension, const uint8_t* data, size_t size) {
   limits.textScanBytes = 64 << 10;
   const uint32_t options = Hash(data, size);
   const EncodeOptions encode{.bmpOs2 = (options >> 1 & 1) != 0,
+                             .iffCompressed = (options >> 3 & 1) != 0,
+                             .iffPacked = (options >> 4 & 1) != 0,
                              .macBinary = (options >> 2 & 1) != 0};
 
   const ReadRequest request{.fileName = file.Fill(data, size),
@@ -57,8 +61,8 @@ void TryCodec(const char* extension, const uint8_t* data, size_t size) {
     std::abort();
   }
   if (CanWrite(row) && row.limits.Allow(picture->image.Width(), picture->image.Height()))
-    Write(row.write, *picture, encode);
-  Write(BmpWrite, *picture, encode);
+    Write(row.write, *picture, extension, encode);
+  Write(BmpWrite, *picture, extension, encode);
 }
 
 }  // namespace fotomill::fuzz

@@ -9,6 +9,16 @@
 
 namespace fotomill {
 
+namespace {
+
+// Which library a format lacks here; empty when it uses none.
+std::string MissingLibrary(int32_t formatIndex) {
+  if (formatIndex == kNoFormat || FormatRow(formatIndex).libraries.empty()) return {};
+  return Tr("The library %1 is not installed.", FormatRow(formatIndex).libraries[0].name);
+}
+
+}  // namespace
+
 std::string_view LooksLike(const std::string& fileName, int32_t formatIndex) {
   return KindBehindName(fileName, formatIndex).name;
 }
@@ -23,6 +33,7 @@ std::string OpenHint(const std::string& fileName, Status status) {
   if (fileName.size() > PathText::Capacity()) return Tr("The path is longer than 260 characters.");
   if (status == Status::FileOpenError) return ReasonSentence();
   if (status == Status::FileReadError && !platform::SystemReason().empty()) return ReasonSentence();
+  if (status == Status::FeatureDisabled) return MissingLibrary(FindFormatByName(fileName));
   if (status != Status::DamagedFile && status != Status::FileReadError &&
       status != Status::UnsupportedFunction && status != Status::UnsupportedFormat) {
     return {};

@@ -25,7 +25,6 @@ struct SignatureOfRow {
 constexpr SignatureOfRow kWithoutCodec[] = {
     {"AVI",  {0, "RIFF"sv, "AVI", 8, "AVI "sv}},
     {"WAV",  {0, "RIFF"sv, "WAV", 8, "WAVE"sv}},
-    {"ANI",  {0, "RIFF"sv, TrLater("an animated cursor"), 8, "ACON"sv}},
     {"CDR",  {0, "RIFF"sv, "CorelDRAW", 8, "CDR"sv}},
     {"AVIF", {4, "ftyp"sv, "AVIF", 8, "avif"sv}},
     {"AVIF", {4, "ftyp"sv, "AVIF", 8, "avis"sv}},
@@ -47,8 +46,6 @@ constexpr SignatureOfRow kWithoutCodec[] = {
     {"JP2",  {0, "\0\0\0\x0cjP  \r\n\x87\n"sv, "JPEG 2000"}},
     {"JP2",  {0, "\xff\x4f\xff\x51"sv, "JPEG 2000"}},
     {"CR2",  {0, "II\x2a\0"sv, "Canon CR2", 8, "CR"sv}},
-    {"KDC",  {0, "II\x2a\0"sv}},
-    {"KDC",  {0, "MM\0\x2a"sv}},
     {"PSB",  {0, "8BPS\0\2"sv, "Photoshop PSB"}},
     {"XCF",  {0, "gimp xcf"sv, "GIMP XCF"}},
     {"",     {0, "FORM"sv, TrLater("IFF animation"), 8, "ANIM"sv}},

@@ -1,5 +1,6 @@
 #!/usr/bin/python3
 """Animations that Pillow writes have the delays, rounds and composed frames that Pillow reads from them."""
+import io
 import json
 import os
 import random
@@ -70,6 +71,51 @@ def cut_in_a_frame(path, folder):
                           stderr=subprocess.DEVNULL).returncode != 0
 
 
+def chunk(name, data):
+    return name + len(data).to_bytes(4, "little") + data + bytes(len(data) % 2)
+
+
+def animated_cursor(path, pictures, sixtieths):
+    """Writes an animated cursor whose pictures are icon files of Pillow's."""
+    icons = b""
+    for picture in pictures:
+        file = io.BytesIO()
+        picture.resize((48, 48)).save(file, "ICO", sizes=[(48, 48)], bitmap_format="bmp")
+        icons += chunk(b"icon", file.getvalue())
+    steps = [0, 3, 1, 2, 5, 4, 0, 0]
+    words = lambda numbers: b"".join(number.to_bytes(4, "little") for number in numbers)
+    body = (b"ACON" + chunk(b"anih", words([36, len(DELAYS), len(steps), 0, 0, 0, 0, 6, 3])) + chunk(b"seq ", words(steps)) +
+            chunk(b"rate", words(sixtieths)) + chunk(b"LIST", b"fram" + icons))
+    path.write_bytes(chunk(b"RIFF", body))
+    return steps
+
+
+def check_animated_cursor(folder):
+    pictures = list(frames(5, True))
+    path = folder / "steps.ani"
+    steps = animated_cursor(path, pictures, [6, 12, 3, 60, 1, 90, 6, 6])
+    facts = told(path)
+    assert facts["pages"] == len(steps) and facts["rounds"] == 0, facts
+    assert facts["delaysMs"] == [100, 200, 50, 1000, 17, 1500, 100, 100], facts
+    for number, step in enumerate(steps):
+        shown = visible(page(path, number + 1, folder / "pages"))
+        assert shown == visible(pictures[step].resize((48, 48))), (path, number)
+    cut_in_a_frame(path, folder)
+
+
+def written_cursor(folder):
+    """The cursor in an animated one that the program writes is a file that Pillow reads."""
+    source = folder / "opaque.png"
+    next(frames(3, False)).save(source)
+    path = folder / "opaque.ani"
+    subprocess.run([FOTOMILL, "convert", "-q", "--out", path, "-t", "ani", source], stdout=subprocess.DEVNULL, check=True)
+    data = path.read_bytes()
+    start = data.index(b"icon") + 8
+    judge = Image.open(io.BytesIO(data[start:start + int.from_bytes(data[start - 4:start], "little")]))
+    assert judge.format == "CUR", judge.format
+    assert visible(judge.convert("RGBA")) == visible(Image.open(source).convert("RGBA"))
+
+
 def main():
     with tempfile.TemporaryDirectory() as name:
         folder = Path(name)
@@ -84,6 +130,8 @@ def main():
                        **({} if loop is None else {"loop": loop}))
             check(path, rounds, folder / "pages")
         cut_in_a_frame(path, folder)
+        check_animated_cursor(folder)
+        written_cursor(folder)
         if features.check("webp_anim"):
             for alpha, loop in ((False, 0), (True, 3)):
                 path = folder / f"alpha{alpha}.webp"

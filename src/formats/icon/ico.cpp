@@ -292,7 +292,7 @@ struct IcoLayout {
   uint32_t PictureSize() const { return kInfoSize + 4 * colors + colorBytes + maskBytes; }
 };
 
-IcoLayout ChooseLayout(const PictureRecord& picture, int32_t compression) {
+IcoLayout ChooseLayout(const PictureRecord& picture, bool cursor, int32_t compression) {
   const PackedImage& image = picture.image;
   IcoLayout layout;
   layout.bits = image.Bits() == 24 && !picture.alpha.Empty() ? 32 : image.Bits();
@@ -301,7 +301,7 @@ IcoLayout ChooseLayout(const PictureRecord& picture, int32_t compression) {
                       static_cast<uint32_t>(image.Height());
   layout.maskBytes =
       static_cast<uint32_t>(RowStride(image.Width(), 1)) * static_cast<uint32_t>(image.Height());
-  layout.cursor = EqualIgnoringCase(platform::ExtensionOf(picture.fileName), "cur");
+  layout.cursor = cursor;
   const bool fullSize = image.Width() == kMostSide && image.Height() == kMostSide;
   layout.png =
       compression == choice::kIconPngAlways || (compression == choice::kIconPng256 && fullSize);
@@ -371,16 +371,45 @@ void WriteMask(ByteWriter& out, const PictureRecord& picture) {
   }
 }
 
+Status WriteBitmap(ByteWriter& out, const PictureRecord& picture, const IcoLayout& layout) {
+  WriteBitmapHeader(out, picture, layout);
+  RETURN_IF_BAD(WriteColors(out, picture, layout));
+  WriteMask(out, picture);
+  return Status::Ok;
+}
+
 }  // namespace
+
+Status DescribeIcon(std::span<const uint8_t> file, const ReadRequest& request,
+                    PictureRecord& picture) {
+  IcoFile icons;
+  RETURN_IF_BAD(ParseDirectory(file, icons));
+  return LoadEntry(icons, request, picture, nullptr, nullptr);
+}
+
+Status DecodeIcon(std::span<const uint8_t> file, const ReadRequest& request,
+                  PictureRecord& picture) {
+  IcoFile icons;
+  RETURN_IF_BAD(ParseDirectory(file, icons));
+  PackedImage image, alpha;
+  RETURN_IF_BAD(LoadEntry(icons, request, picture, &image, &alpha));
+  picture.image = std::move(image);
+  picture.alpha = std::move(alpha);
+  return Status::Ok;
+}
+
+Status EncodeCursor(const PictureRecord& picture, ByteWriter& out) {
+  const IcoLayout layout = ChooseLayout(picture, true, choice::kIconBitmaps);
+  WriteDirectory(out, picture, layout);
+  return WriteBitmap(out, picture, layout);
+}
 
 Status IcoInfo(PictureRecord& picture, const ReadRequest& request) {
   picture.typeName.Clear();
   platform::FileView file;
   if (!file.Open(request.fileName)) return Status::FileOpenError;
   picture.fileSize = file.FileSize();
-  IcoFile icons;
-  RETURN_IF_BAD(ParseDirectory(file.Bytes(), icons));
-  return LoadEntry(icons, request, picture, nullptr, nullptr);
+  return DescribeIcon(file.Bytes(), request, picture);
 }
 
 Status IcoRead(PictureRecord& picture, const ReadRequest& request) {
@@ -389,14 +418,11 @@ Status IcoRead(PictureRecord& picture, const ReadRequest& request) {
   picture.alpha.Free();
   platform::FileView file;
   if (!file.Open(request.fileName)) return Status::FileOpenError;
-  IcoFile icons;
-  RETURN_IF_BAD(ParseDirectory(file.Bytes(), icons));
-  PackedImage image, alpha;
-  RETURN_IF_BAD(LoadEntry(icons, request, picture, &image, &alpha));
-  if (!file.Intact()) return Status::FileReadError;
-  picture.image = std::move(image);
-  picture.alpha = std::move(alpha);
-  return Status::Ok;
+  RETURN_IF_BAD(DecodeIcon(file.Bytes(), request, picture));
+  if (file.Intact()) return Status::Ok;
+  picture.image.Free();
+  picture.alpha.Free();
+  return Status::FileReadError;
 }
 
 Status IcoWrite(PictureRecord& picture, const WriteOptions& options) {
@@ -404,16 +430,16 @@ Status IcoWrite(PictureRecord& picture, const WriteOptions& options) {
   if (picture.image.Empty()) return Status::MemoryAllocationError;
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
-  const IcoLayout layout = ChooseLayout(picture, options.encode.iconCompression);
+  const IcoLayout layout =
+      ChooseLayout(picture, EqualIgnoringCase(platform::ExtensionOf(picture.fileName), "cur"),
+                   options.encode.iconCompression);
   WriteDirectory(out, picture, layout);
   if (layout.png) {
     RETURN_IF_BAD(EncodePng(picture, options.encode, out));
     out.PatchLe32(kSizeOffset,
                   static_cast<uint32_t>(out.Position()) - kFileHeaderSize - kEntrySize);
   } else {
-    WriteBitmapHeader(out, picture, layout);
-    RETURN_IF_BAD(WriteColors(out, picture, layout));
-    WriteMask(out, picture);
+    RETURN_IF_BAD(WriteBitmap(out, picture, layout));
   }
   return CommitOutput(out, options);
 }

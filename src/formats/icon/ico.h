@@ -1,5 +1,8 @@
 #pragma once
 
+#include <span>
+
+#include "core/byte_writer.h"
 #include "picture/picture_record.h"
 #include "picture/read_request.h"
 #include "picture/write_options.h"
@@ -15,5 +18,14 @@ Status IcoRead(PictureRecord& picture, const ReadRequest& request);
 // Writes one entry; a cursor when the extension is "cur". Also ErrorCreatingFile (10),
 // ErrorWritingFile (11).
 Status IcoWrite(PictureRecord& picture, const WriteOptions& options);
+
+// The same for a file that stands inside another one: facts, pixels, and a cursor of one bitmap
+// with its mask, which a picture of at most 256 x 256 pixels becomes. `picture` keeps its file's
+// name and size.
+Status DescribeIcon(std::span<const uint8_t> file, const ReadRequest& request,
+                    PictureRecord& picture);
+Status DecodeIcon(std::span<const uint8_t> file, const ReadRequest& request,
+                  PictureRecord& picture);
+Status EncodeCursor(const PictureRecord& picture, ByteWriter& out);
 
 }  // namespace fotomill

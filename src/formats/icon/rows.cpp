@@ -1,5 +1,6 @@
 #include "formats/rows.h"
 
+#include "formats/icon/ani.h"
 #include "formats/icon/ico.h"
 #include "texts/texts.h"
 
@@ -14,8 +15,10 @@ constexpr std::string_view kIcon = "\0\0\1\0"sv, kCursor = "\0\0\2\0"sv;
 constexpr Signature kIconSignatures[] = {{0, kIcon, TrLater("an icon")}, {0, kCursor}};
 constexpr Signature kCursorSignatures[] = {{0, kCursor, TrLater("a cursor")}, {0, kIcon}};
 
-constexpr FormatSetting kKeys[] = {{"ICOCompression", TrLater("Icons (ICO): compression")}};
-constexpr FormatSettings kSettings = {"ICO", "OverrideIcoBox", TrLater("Other formats"), kKeys};
+constexpr Signature kAniSignatures[] = {{0, "RIFF"sv, TrLater("an animated cursor"), 8, "ACON"sv}};
+
+constexpr FormatSetting kKeys[] = {{"ICOCompression", TrLater("Compression")}};
+constexpr FormatSettings kSettings = {"ICO", "OverrideIcoBox", TrLater("Windows icon"), kKeys};
 
 constexpr FormatEntry Row(std::string_view extension, std::string_view description, uint32_t flags,
                           std::span<const Signature> signatures, bool hasOptionsBox) {
@@ -42,6 +45,20 @@ constexpr FormatEntry kRows[] = {
         kIconSignatures, true),
     Row("CUR", "(CUR) Windows cursor", FMT_BITMAP | FMT_SECONDARY | FMT_ALPHA, kCursorSignatures,
         false),
+    {.info = AniInfo,
+     .read = AniRead,
+     .write = AniWrite,
+     .maxBits = 24,
+     .limits = {256, 256},
+     .extension = "ANI"sv,
+     .description = "(ANI) Windows animated cursor"sv,
+     .enabled = 1,
+     .flags = FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES | FMT_LAYERED |
+              FMT_SECONDARY | FMT_TRANSPARENT,
+     .animate = AniAnimate,
+     .canRead = true,
+     .canWrite = true,
+     .signatures = kAniSignatures},
 };
 
 }  // namespace

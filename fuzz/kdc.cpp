@@ -1,0 +1,18 @@
+#include "platform/work_apart.h"
+#include "registry/child_tasks.h"
+#include "support/codec_target.h"
+
+#include <cstdlib>
+
+// The codec's decoder runs apart, which is this program started again.
+extern "C" int LLVMFuzzerInitialize(int* count, char*** arguments) {
+  if (const auto status =
+          fotomill::platform::ServeApart(*count, *arguments, fotomill::ChildTasks()))
+    std::exit(*status);
+  return 0;
+}
+
+extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
+  fotomill::fuzz::TryCodec("kdc", data, size);
+  return 0;
+}
