@@ -48,6 +48,22 @@ TEST(SetupPages, ShowSettingsThatDoSomethingAndExplainThem) {
   }
 }
 
+// The page of format options has each format in one group, and all of its settings but those that
+// belong to other pages.
+TEST(SetupPages, FormatsHaveAGroupEach) {
+  std::set<std::string_view> groups;
+  for (const FormatSettings* const codec : SettingsOfFormats()) {
+    EXPECT_TRUE(groups.insert(codec->group).second) << codec->group;
+  }
+  std::string_view last;
+  for (const SetupItem& item : ItemsOf(SetupPage::FormatOptions)) {
+    if (item.group == last) continue;
+    EXPECT_EQ(groups.erase(item.group), 1u) << item.group << " is there twice";
+    last = item.group;
+  }
+  EXPECT_TRUE(groups.empty()) << *groups.begin() << " has nothing to set";
+}
+
 TEST(SetupPages, SearchFindsEveryWord) {
   struct Row {
     const char* words;

@@ -15,10 +15,10 @@ constexpr Signature kLesserSignatures[] = {{0, "FORM"sv, {}, 8, "ILBM"sv},
                                            {0, "FORM"sv, {}, 8, "PBM "sv}};
 
 constexpr FormatSetting kKeys[] = {
-    {"CreateIffCompressed", TrLater("Amiga (IFF): compressed")},
-    {"CreateIffPBM", TrLater("Amiga (IFF): palette pictures as PBM")},
+    {"CreateIffCompressed", TrLater("Compressed")},
+    {"CreateIffPBM", TrLater("Palette pictures as PBM")},
 };
-constexpr FormatSettings kSettings = {"IFF", "OverrideIffBox", TrLater("Other formats"), kKeys};
+constexpr FormatSettings kSettings = {"IFF", "OverrideIffBox", TrLater("Amiga IFF"), kKeys};
 
 constexpr FormatEntry Row(std::string_view extension, std::string_view description,
                           uint32_t maxBits, WriteOperation write,

@@ -25,8 +25,8 @@ constexpr Signature kArraySignatures[] = {
     {0, "BM"sv, {}, 6, "\0\0\0\0"sv},
 };
 
-constexpr FormatSetting kKeys[] = {{"WriteOS2Bitmaps", TrLater("Bitmaps (BMP): OS/2 version")}};
-constexpr FormatSettings kSettings = {"BMP", "OverrideBmpBox", TrLater("Other formats"), kKeys};
+constexpr FormatSetting kKeys[] = {{"WriteOS2Bitmaps", TrLater("OS/2 version")}};
+constexpr FormatSettings kSettings = {"BMP", "OverrideBmpBox", TrLater("Windows bitmap"), kKeys};
 
 constexpr FormatEntry Row(std::string_view extension, std::string_view description,
                           DetailsOperation details) {

@@ -10,11 +10,11 @@ namespace {
 using namespace std::string_view_literals;
 
 constexpr FormatSetting kKeys[] = {
-    {"CreateMacbinaryHeader", TrLater("MacPaint (MAC): add a MacBinary header")},
+    {"CreateMacbinaryHeader", TrLater("Add a MacBinary header")},
     {"FXMonoDither"},
     {"FXThreshold"},
 };
-constexpr FormatSettings kSettings = {"MAC", "OverrideMacBox", TrLater("Other formats"), kKeys};
+constexpr FormatSettings kSettings = {"MAC", "OverrideMacBox", TrLater("MacPaint"), kKeys};
 
 constexpr FormatEntry kRows[] = {{
     .info = MacInfo,

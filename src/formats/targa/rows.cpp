@@ -9,8 +9,8 @@ namespace {
 
 using namespace std::string_view_literals;
 
-constexpr FormatSetting kKeys[] = {{"CreateTarga16", TrLater("Targa (TGA): 16 bits per pixel")}};
-constexpr FormatSettings kSettings = {"TGA", "OverrideTgaBox", TrLater("Other formats"), kKeys};
+constexpr FormatSetting kKeys[] = {{"CreateTarga16", TrLater("16 bits per pixel")}};
+constexpr FormatSettings kSettings = {"TGA", "OverrideTgaBox", TrLater("Targa"), kKeys};
 
 constexpr FormatEntry kRows[] = {{
     .info = TgaInfo,

@@ -10,10 +10,10 @@ namespace {
 using namespace std::string_view_literals;
 
 constexpr FormatSetting kKeys[] = {
-    {"TextCharacterLevels", TrLater("Text (TXT): characters from light to dark")},
-    {"InvertTextFiles", TrLater("Text (TXT): light text on a dark screen")},
+    {"TextCharacterLevels", TrLater("Characters from light to dark")},
+    {"InvertTextFiles", TrLater("Light text on a dark screen")},
 };
-constexpr FormatSettings kSettings = {"TXT", "OverrideTxtBox", TrLater("Other formats"), kKeys};
+constexpr FormatSettings kSettings = {"TXT", "OverrideTxtBox", TrLater("Text files"), kKeys};
 
 constexpr FormatEntry kRows[] = {{
     .info = TxtInfo,

@@ -12,9 +12,9 @@ using namespace std::string_view_literals;
 constexpr Signature kSignatures[] = {{0, "begin "sv, "UUE"}};
 
 constexpr FormatSetting kKeys[] = {
-    {"RelaxedUUE", TrLater("UUEncoded (UUE): pass over damaged lines")},
+    {"RelaxedUUE", TrLater("Pass over damaged lines")},
 };
-constexpr FormatSettings kSettings = {"UUE", "OverrideUueBox", TrLater("Other formats"), kKeys};
+constexpr FormatSettings kSettings = {"UUE", "OverrideUueBox", TrLater("UUEncoded"), kKeys};
 
 constexpr FormatEntry kRows[] = {{
     .info = UueInfo,

@@ -178,9 +178,10 @@ constexpr SetupItem kItems[] = {
 // clang-format on
 
 constexpr const char* kTitles[] = {
-    TrLater("Browsing"),     TrLater("Thumbnails"), TrLater("Viewing"), TrLater("Batches"),
-    TrLater("Saving"),       TrLater("File names"), TrLater("Colors"),  TrLater("Captions and mattes"),
-    TrLater("EXIF and info"), TrLater("File history"), TrLater("Formats")};
+    TrLater("Browsing"), TrLater("Thumbnails"), TrLater("Viewing"), TrLater("Batches"),
+    TrLater("Saving"), TrLater("Format options"), TrLater("File names"), TrLater("Colors"),
+    TrLater("Captions and mattes"), TrLater("EXIF and info"), TrLater("File history"),
+    TrLater("Formats")};
 static_assert(std::size(kTitles) == kSetupPageCount);
 
 consteval bool EveryItemIsShownOnce() {
@@ -194,17 +195,17 @@ consteval bool EveryItemIsShownOnce() {
 }
 static_assert(EveryItemIsShownOnce());
 
-// The rows above, and at the end of the page Saving those that the formats have themselves.
+// The rows above, and on a page of their own those that the formats have themselves, a group each.
 std::vector<SetupItem> WithSettingsOfFormats() {
   std::vector<SetupItem> items(std::begin(kItems), std::end(kItems));
   auto place =
-      std::ranges::find_if(items, [](const SetupItem& item) { return item.page > Saving; });
+      std::ranges::find_if(items, [](const SetupItem& item) { return item.page > FormatOptions; });
   for (const FormatSettings* const codec : SettingsOfFormats()) {
     for (const FormatSetting& setting : codec->keys) {
       const KeyRow* const row = FindKey(setting.key);
       if (row == nullptr || *setting.label == '\0') continue;
-      place = items.insert(place, {Saving, codec->group, static_cast<KeyNumber>(NumberOfKey(*row)),
-                                   setting.label}) +
+      place = items.insert(place, {FormatOptions, codec->group,
+                                   static_cast<KeyNumber>(NumberOfKey(*row)), setting.label}) +
               1;
     }
   }

@@ -16,6 +16,7 @@ enum class SetupPage {
   Viewing,
   Batches,
   Saving,
+  FormatOptions,
   Names,
   Colors,
   Captions,
@@ -23,7 +24,7 @@ enum class SetupPage {
   History,
   Formats
 };
-inline constexpr size_t kSetupPageCount = 11;
+inline constexpr size_t kSetupPageCount = 12;
 // The title of a page in English.
 const char* TitleOf(SetupPage page);
 
