@@ -11,8 +11,8 @@ using namespace std::string_view_literals;
 
 constexpr Signature kSignatures[] = {{0, "PCD_OPA"sv, TrLater("a Photo CD overview")}};
 
-constexpr FormatSetting kKeys[] = {{"PhotoCDResolution", TrLater("Photo CD: largest size read")}};
-constexpr FormatSettings kSettings = {"PCD", "OverridePcdBox", TrLater("Other formats"), kKeys};
+constexpr FormatSetting kKeys[] = {{"PhotoCDResolution", TrLater("Largest size read")}};
+constexpr FormatSettings kSettings = {"PCD", "OverridePcdBox", TrLater("Photo CD"), kKeys};
 
 Status CannotWrite(PictureRecord&, const WriteOptions&) { return Status::UnsupportedFunction; }
 
