@@ -22,7 +22,7 @@ uint32_t Hash(const uint8_t* data, size_t size) {
 // Some writers decide by the extension of their file.
 void Write(const WriteOperation write, PictureRecord& picture, const char* extension,
            const EncodeOptions& encode) {
-  static const std::string path = ScratchPath(std::string("out.") + extension);
+  static const std::string path = ScratchPath("out.") + extension;
   picture.fileName.AssignCut(path);
   (void)write(picture, {.encode = encode});
   unlink(path.c_str());
