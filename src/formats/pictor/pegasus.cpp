@@ -85,7 +85,6 @@ void MakeTables(PegasusStream& stream) {
       put(std::clamp<uint32_t>((step * code + 16) / 32, 1, 255));
   }
   stream.hasTables = true;
-  // the room left is the end of the stream
   put(0xFF);
   put(0xD9);
 }

@@ -15,7 +15,7 @@ struct PegasusStream {
   // the codes of the "PIC" segment: 32 means the tables of T.81, K.1. 0 where there is none.
   uint8_t lumaCode = 0, chromaCode = 0;
   // an abbreviated stream with two quantizer tables; empty without codes
-  std::array<uint8_t, 138> tables = {};
+  std::array<uint8_t, 2 + 2 * (5 + 64) + 2> tables = {};
   bool hasTables = false;
 
   std::span<const uint8_t> Tables() const {
