@@ -51,6 +51,7 @@ Status NewLayer(Size size, PictureRecord& layer) {
 
 Status LetteringDrawing::Open(const Lettering& lettering, const std::string& text) {
   lettering_ = lettering;
+  lettering_.outline = std::min(lettering_.outline, lettering_.em);  // wider ones hide the letters
   RETURN_IF_BAD(font_.Open(lettering.font, lettering.em));
   block_ = LayOutText(font_, WithLineFeeds(text), lettering.layout);
   return Status::Ok;
