@@ -104,6 +104,10 @@ TEST_F(ExifCommand, ExtractsTheThumbnailWithoutReplacingAnything) {
   const std::string out = folder.Path("small.jpg");
   EXPECT_EQ(Exif({picture, "--thumbnail", out}).status, 0);
   EXPECT_EQ(ReadBytes(out), Hex("FFD8 FFD9"));
+  const CommandResult stream = Exif({picture, "--thumbnail", "-"});
+  EXPECT_EQ(stream.out, std::string("\xFF\xD8\xFF\xD9"));
+  EXPECT_THAT(stream.err, HasSubstr("One file was processed."));
+  EXPECT_EQ(RunCommand({"exif", picture, "--thumbnail", "-"}, {.output = true}).status, 2);
   WriteText(out, "mine");
   const CommandResult refused = Exif({picture, "--thumbnail", out});
   EXPECT_EQ(refused.status, 1);

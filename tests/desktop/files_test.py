@@ -1,5 +1,7 @@
 #!/usr/bin/env python3
 """What the real program does to files, and takes back; thumbnail files; the session that comes back."""
+import os
+
 from driven_desktop import Desktop, make_pictures, run
 
 
@@ -64,6 +66,26 @@ def rename_delete_undo_paste(folder):
         desktop.wait(r"view place=1/3 .*status=0 .*a.bmp")
         desktop.wait(r"files Deletion of a \[1\].bmp done=1")
         assert names(pictures) == ["a.bmp", "b [1].bmp", "b.bmp"], names(pictures)
+
+
+def names_that_are_not_utf8(folder):
+    """Such a folder comes by the command line, such files by the clipboard."""
+    pictures, other = os.fsencode(folder) + b"/caf\xe9", folder / "other"
+    os.mkdir(pictures)
+    make_pictures(folder / "made", ["a.bmp", "b.bmp"])
+    other.mkdir()
+    os.rename(folder / "made/a.bmp", pictures + b"/na\xefve.bmp")
+    os.rename(folder / "made/b.bmp", pictures + b"/p%20 q#.bmp")
+    with Desktop(folder, os.fsdecode(pictures), settings=["UpdateThumbnailsFlag=0"]) as desktop:
+        desktop.wait(r"lines=2 .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+a", "ctrl+c")
+        desktop.key("ctrl+l")
+        desktop.type(str(other) + "\n")
+        desktop.wait(r"lines=0 .*listing=0 .*folder=.*other$")
+        desktop.key("ctrl+v")
+        desktop.wait(r"files Copy of 2 files done=2 failed=0")
+        assert sorted(os.listdir(os.fsencode(other))) == [b"na\xefve.bmp", b"p%20 q#.bmp"], os.listdir(other)
 
 
 def rename_in_sequence(folder):
@@ -176,4 +198,4 @@ def turn_and_take_back(folder):
         desktop.key("Return")
 
 
-run(rename_delete_undo_paste, rename_in_sequence, thumbnails_and_session, turn_and_take_back)
+run(rename_delete_undo_paste, names_that_are_not_utf8, rename_in_sequence, thumbnails_and_session, turn_and_take_back)

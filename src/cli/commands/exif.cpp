@@ -9,6 +9,7 @@
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
 #include "cli/selection/file_selection.h"
+#include "cli/selection/output_place.h"
 #include "metadata/exif/exif_source.h"
 #include "metadata/exif/exif_text.h"
 #include "metadata/gps.h"
@@ -59,9 +60,14 @@ struct Outcome {
   bool cutShort = false;  // it has more entries than are shown
 };
 
-Outcome WriteThumbnail(std::span<const uint8_t> bytes, const ExifOptions& options) {
+Outcome WriteThumbnail(std::span<const uint8_t> bytes, const ExifOptions& options,
+                       std::FILE* stream) {
   const std::string& path = options.thumbnail;
   if (bytes.empty()) return {Status::NoImages, Tr("This file has no embedded thumbnail."), {}};
+  if (path == kStream) {
+    std::fwrite(bytes.data(), 1, bytes.size(), stream);  // a failure shows in the stream
+    return {};
+  }
   const bool replace = options.overwrite == "replace";
   const std::string taken = Tr("The file exists; use --overwrite replace to replace it.");
   if (!replace && platform::FileExists(path)) return {Status::ErrorCreatingFile, taken, path};
@@ -78,8 +84,10 @@ Outcome WriteThumbnail(std::span<const uint8_t> bytes, const ExifOptions& option
   return {Status::ErrorWritingFile, ReasonSentence(), path};
 }
 
-// Walks the EXIF of one file into `sink` and writes its thumbnail if asked to.
-Outcome WalkFile(const SelectedFile& file, const ExifOptions& options, ExifSink& sink) {
+// Walks the EXIF of one file into `sink` and writes its thumbnail if asked to; `stream` is standard
+// output.
+Outcome WalkFile(const SelectedFile& file, const ExifOptions& options, ExifSink& sink,
+                 std::FILE* stream) {
   if (file.status != Status::Ok) return {file.status, file.hint, {}};
   ExifSource source;
   if (const Status status = source.Open(file.name.c_str()); status != Status::Ok)
@@ -90,7 +98,8 @@ Outcome WalkFile(const SelectedFile& file, const ExifOptions& options, ExifSink&
     return {Status::DamagedFile, Tr("The EXIF block has no valid header."), {}};
   }
   Outcome outcome;
-  if (!options.thumbnail.empty()) outcome = WriteThumbnail(ExifThumbnail(block, findings), options);
+  if (!options.thumbnail.empty())
+    outcome = WriteThumbnail(ExifThumbnail(block, findings), options, stream);
   outcome.hasExif = !block.empty();
   outcome.cutShort = findings.cutShort;
   if (!source.Intact())
@@ -101,7 +110,10 @@ Outcome WalkFile(const SelectedFile& file, const ExifOptions& options, ExifSink&
 class ExifRun {
  public:
   ExifRun(const ExifOptions& options, const CommandContext& context)
-      : options_(options), output_(context, options.json) {}
+      : options_(options),
+        stream_(context.io.out),
+        context_(options.thumbnail == kStream ? WithResultsOnError(context) : context),
+        output_(context_, options.json) {}
 
   void ReportFiles(const Selection& selection) {
     output_.CloseWith(selection.leftOut);
@@ -144,7 +156,7 @@ class ExifRun {
   Outcome ReportJson(const SelectedFile& file) {
     JsonLines lines;
     Json element;
-    const Outcome outcome = WalkFile(file, options_, lines);
+    const Outcome outcome = WalkFile(file, options_, lines, stream_);
     PutName(element, "file", output_.NameOf(file.name));
     PutStatus(element, outcome.status);
     element["directories"] = lines.Take();
@@ -155,7 +167,7 @@ class ExifRun {
   // The lines of one file, in a single write; with several files, the name comes first.
   Outcome ReportLines(const SelectedFile& file, bool named) {
     lines_.Clear();
-    Outcome outcome = WalkFile(file, options_, lines_);
+    Outcome outcome = WalkFile(file, options_, lines_, stream_);
     if (outcome.status == Status::Ok && !lines_.Complete())
       outcome.status = Status::MemoryAllocationError;
     if (lines_.Text().empty()) return outcome;
@@ -168,6 +180,8 @@ class ExifRun {
   }
 
   const ExifOptions& options_;
+  std::FILE* const stream_;
+  const CommandContext context_;  // results are not mixed with a thumbnail
   ResultOutput output_;
   ExifText lines_{ExifTextOptionsFromSettings()};
   std::string text_;
@@ -205,6 +219,10 @@ int RunExif(const ExifOptions& options, const CommandContext& context) {
       measures && context.names.values.empty() && options.selection.filesFrom.empty();
   const auto selection = alone ? Selection() : SelectFiles(options.selection, context);
   if (!selection) return kExitUsage;
+  if (options.thumbnail == kStream && context.io.outTerminal)
+    return UsageError(
+        context,
+        Tr("Standard output is a terminal; redirect it, or name a file with --thumbnail."));
   if (!options.thumbnail.empty()) {
     if (selection->files.size() != 1)
       return UsageError(context, Tr("--thumbnail takes exactly one picture."));
@@ -225,8 +243,8 @@ void SetUpExif(CLI::App& app, CommandContext& context) {
   options->selection.takesInput = true;
   AddSelection(app, options->selection, context);
   AddFlag(app, "--json", options->json, "Print a JSON array with one object per file");
-  AddName(app, "--thumbnail", options->thumbnail, "OUT",
-          "Extract the embedded thumbnail to this file, unchanged");
+  AddName(app, "--thumbnail", options->thumbnail, "OUT|-",
+          "Extract the embedded thumbnail to this file, unchanged; - is standard output");
   AddChoice(app, "--overwrite", options->overwrite, "HOW",
             "If the output exists: refuse (default) or replace", {"refuse", "replace"});
   AddTexts(app, "--distance", options->distance, 2, "LAT,LON LAT,LON",

@@ -15,6 +15,7 @@
 #include "desktop/windows/browser/path_bar.h"
 #include "desktop/windows/browser/thumbnail_canvas.h"
 #include "desktop/windows/browser/update_bar.h"
+#include "desktop/windows/files/file_list_data.h"
 #include "desktop/windows/files/folder_drop.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/folders.h"
@@ -372,9 +373,9 @@ void BrowserPage::Activate(size_t line) {
 }
 
 void BrowserPage::BeginDrag() {
-  wxFileDataObject files;
-  for (const std::string& file : model_.FilesForFunction()) files.AddFile(wxString::FromUTF8(file));
-  if (files.GetFilenames().empty()) return;
+  const std::vector<std::string> chosen = model_.FilesForFunction();
+  if (chosen.empty()) return;
+  FileListData files(chosen);
   wxDropSource source(files, this);
   if (source.DoDragDrop(wxDrag_AllowMove) == wxDragMove) Reload();
 }

@@ -2,8 +2,7 @@
 
 #include <wx/clipbrd.h>
 #include <wx/dataobj.h>
-#include <wx/filename.h>
-#include <wx/filesys.h>
+#include <wx/frame.h>
 #include <wx/image.h>
 #include <wx/msgdlg.h>
 #include <wx/textdlg.h>
@@ -15,8 +14,10 @@
 #include "desktop/models/files/operation_options.h"
 #include "desktop/models/files/pasted_picture.h"
 #include "desktop/models/files/turn_one_file.h"
+#include "desktop/models/files/uri_list.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/dialogs/folder_dialog.h"
+#include "desktop/windows/files/file_list_data.h"
 #include "desktop/windows/history/use_recorder.h"
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/shell.h"
@@ -270,13 +271,9 @@ void FileActions::Redo() {
 
 void FileActions::ToClipboard(const std::vector<std::string>& paths, bool cut) {
   if (paths.empty()) return;
-  auto* files = new wxFileDataObject;
+  auto* files = new FileListData(paths);
   std::string urls = cut ? "cut" : "copy";
-  for (const std::string& path : paths) {
-    const wxString name = wxString::FromUTF8(path);
-    files->AddFile(name);
-    urls += "\n" + Utf8(wxFileSystem::FileNameToURL(wxFileName(name)));
-  }
+  for (const std::string& path : paths) urls += "\n" + UriOf(path);
   auto* marked = new wxCustomDataObject(wxDataFormat(kGnomeFiles));
   marked->SetData(urls.size(), urls.data());
   auto* both = new wxDataObjectComposite;
@@ -290,29 +287,26 @@ void FileActions::ToClipboard(const std::vector<std::string>& paths, bool cut) {
 
 void FileActions::PathsToClipboard(const std::vector<std::string>& paths) {
   wxString text;
-  for (const std::string& path : paths)
-    text += (text.empty() ? "" : "\n") + wxString::FromUTF8(path);
+  for (const std::string& path : paths) text += (text.empty() ? "" : "\n") + Shown(path);
   const wxClipboardLocker clipboard;
   if (!clipboard || !wxTheClipboard->SetData(new wxTextDataObject(text))) wxBell();
 }
 
 void FileActions::Paste(const std::string& folder) {
-  wxFileDataObject files;
+  FileListData files;
   wxCustomDataObject marked{wxDataFormat(kGnomeFiles)};
   bool cut = false;
   {
     const wxClipboardLocker clipboard;
     if (!clipboard) return wxBell();
-    if (!wxTheClipboard->GetData(files)) return PastePicture(folder);
+    if (!wxTheClipboard->GetData(files) || files.Paths().empty()) return PastePicture(folder);
     if (wxTheClipboard->GetData(marked)) {
       cut = std::string(static_cast<const char*>(marked.GetData()), marked.GetSize())
                 .starts_with("cut");
     }
     if (cut) wxTheClipboard->Clear();  // they can be moved once only
   }
-  std::vector<std::string> paths;
-  for (const wxString& name : files.GetFilenames()) paths.push_back(Utf8(name));
-  Do(cut ? FileOperationKind::Move : FileOperationKind::Copy, paths, folder);
+  Do(cut ? FileOperationKind::Move : FileOperationKind::Copy, files.Paths(), folder);
 }
 
 // With the clipboard open.

@@ -38,11 +38,15 @@ wxDragResult FolderDrop::OnDragOver(wxCoord x, wxCoord y, wxDragResult) {
   return KindNow() == DropKind::Move ? wxDragMove : wxDragCopy;
 }
 
-bool FolderDrop::OnDropFiles(wxCoord x, wxCoord y, const wxArrayString& names) {
-  const std::string folder = folderAt_(wxPoint(x, y));
-  if (folder.empty() || names.empty()) return false;
-  std::vector<std::string> files;
-  for (const wxString& name : names) files.push_back(Utf8(name));
+wxDragResult FolderDrop::OnData(wxCoord x, wxCoord y, wxDragResult suggested) {
+  if (!GetData()) return wxDragNone;
+  std::vector<std::string> files = static_cast<FileListData*>(GetDataObject())->Paths();
+  return Drop(folderAt_(wxPoint(x, y)), std::move(files)) ? suggested : wxDragNone;
+}
+
+// False if nothing is to be done.
+bool FolderDrop::Drop(const std::string& folder, std::vector<std::string> files) const {
+  if (folder.empty() || files.empty()) return false;
   // What is there already stays.
   if (platform::SplitPath(files.front()).folder == platform::JoinFolder(folder, "")) return false;
   const DropKind kind = KindNow();

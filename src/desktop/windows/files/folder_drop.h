@@ -6,23 +6,29 @@
 #include <string>
 #include <vector>
 
+#include "desktop/windows/files/file_list_data.h"
+
 namespace fotomill::desktop {
 
 // Files dropped on a window go to a folder: moved with Shift, copied with Ctrl, else as DropOptions
 // says.
-class FolderDrop : public wxFileDropTarget {
+class FolderDrop : public wxDropTarget {
  public:
   // The folder at a place of the window, empty for none.
   using FolderAt = std::function<std::string(const wxPoint& place)>;
   using Dropped = std::function<void(const std::vector<std::string>& files,
                                      const std::string& folder, bool move)>;
   FolderDrop(FolderAt folderAt, Dropped dropped)
-      : folderAt_(std::move(folderAt)), dropped_(std::move(dropped)) {}
+      : wxDropTarget(new FileListData),
+        folderAt_(std::move(folderAt)),
+        dropped_(std::move(dropped)) {}
 
   wxDragResult OnDragOver(wxCoord x, wxCoord y, wxDragResult suggested) override;
-  bool OnDropFiles(wxCoord x, wxCoord y, const wxArrayString& names) override;
+  wxDragResult OnData(wxCoord x, wxCoord y, wxDragResult suggested) override;
 
  private:
+  bool Drop(const std::string& folder, std::vector<std::string> files) const;
+
   const FolderAt folderAt_;
   const Dropped dropped_;
 };

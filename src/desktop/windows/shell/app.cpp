@@ -8,11 +8,12 @@
 #include <functional>
 #include <memory>
 #include <string>
+#include <vector>
 
 #include "core/data_folder.h"
-#include "files/previous_file.h"
 #include "desktop/models/setup/language_choice.h"
 #include "desktop/models/shell/event_log.h"
+#include "desktop/models/shell/start_argument.h"
 #include "desktop/models/view/view_picture.h"
 #include "desktop/windows/setup/override_box.h"
 #include "desktop/windows/shell/frame_session.h"
@@ -20,6 +21,7 @@
 #include "desktop/windows/view/screen_profile.h"
 #include "desktop/windows/widgets/control_names.h"
 #include "desktop/windows/widgets/wx_text.h"
+#include "files/previous_file.h"
 #include "platform/first_start.h"
 #include "platform/folders.h"
 #include "platform/process.h"
@@ -35,6 +37,7 @@ namespace fotomill::desktop {
 
 namespace {
 
+std::vector<std::string> programArguments;  // as the system gave them
 constexpr double kHandOverSeconds = 2;  // that a running program has to answer
 
 // Starts of the same user on the same screen with the same data folder are one program.
@@ -67,7 +70,9 @@ class App : public wxApp {
     parser.AddParam("FOLDER or FILE", wxCMD_LINE_VAL_STRING, wxCMD_LINE_PARAM_OPTIONAL);
   }
   bool OnCmdLineParsed(wxCmdLineParser& parser) override {
-    if (parser.GetParamCount() > 0) argument_ = platform::AbsolutePath(Utf8(parser.GetParam(0)));
+    const std::string parsed = parser.GetParamCount() > 0 ? Utf8(parser.GetParam(0)) : "";
+    const std::string argument = StartArgument(programArguments, parsed);
+    if (!argument.empty()) argument_ = platform::AbsolutePath(argument);
     newInstance_ = parser.Found(kNewInstance);
     return true;
   }
@@ -155,6 +160,10 @@ class App : public wxApp {
   platform::FirstStart firstStart_;
 };
 
+void KeepArguments(int count, char** arguments) {
+  if (count > 1) programArguments.assign(arguments + 1, arguments + count);
+}
+
 }  // namespace fotomill::desktop
 
 wxIMPLEMENT_APP_NO_MAIN(fotomill::desktop::App);
@@ -162,5 +171,6 @@ wxIMPLEMENT_APP_NO_MAIN(fotomill::desktop::App);
 int main(int count, char** arguments) {
   using namespace fotomill;
   if (const auto status = platform::ServeApart(count, arguments, ChildTasks())) return *status;
+  fotomill::desktop::KeepArguments(count, arguments);
   return wxEntry(count, arguments);
 }
