@@ -52,10 +52,20 @@ std::string_view NearestBelow(size_t fewest, std::string_view typed,
 }  // namespace
 
 std::string_view NearestName(std::string_view typed, std::span<const std::string_view> names) {
-  if (typed.empty() || typed.size() > kLongestName) return {};
-  // one slip in a short word, one more for every three letters
-  const size_t fewest = typed.size() / 3 + 2;
-  return NearestBelow(fewest, typed, names);
+  constexpr size_t kShortestBeginning = 3;
+  if (typed.size() < 2 || typed.size() > kLongestName) return {};
+  for (const std::string_view name : names) {
+    if (name.size() <= kLongestName && EditDistance(typed, name) <= 1) return name;
+  }
+  std::string_view only;
+  for (const std::string_view name : names) {
+    if (typed.size() < kShortestBeginning ||
+        !EqualIgnoringCase(name.substr(0, typed.size()), typed))
+      continue;
+    if (!only.empty()) return {};
+    only = name;
+  }
+  return only;
 }
 
 std::string_view NearestOfAll(std::string_view typed, std::span<const std::string_view> names) {

@@ -6,12 +6,13 @@
 
 namespace fotomill {
 
-// The name that someone who typed `typed` most likely meant: the one with the fewest wrong,
-// missing, extra or swapped characters, case ignored, or one that begins with what was typed. Empty
-// when none is close; the first of equals.
+// The name that someone who typed `typed` surely meant: one with a single wrong, missing, extra or
+// swapped character, case ignored, or the only one that begins with what was typed. Empty when
+// there is none; the first of equals.
 std::string_view NearestName(std::string_view typed, std::span<const std::string_view> names);
 
-// The nearest by the same measure, however far it is; empty only if there are no names.
+// The one with the fewest such characters, or one that begins with what was typed, however far it
+// is; empty only if there are no names.
 std::string_view NearestOfAll(std::string_view typed, std::span<const std::string_view> names);
 
 }  // namespace fotomill

@@ -1,11 +1,15 @@
 #include "settings/setting_value.h"
 
 #include <charconv>
+#include <cstdio>
+#include <iterator>
 #include <optional>
 
 #include "core/plain_name.h"
+#include "core/text.h"
 #include "core/utf8.h"
 #include "core/whole_number.h"
+#include "operations/parameter.h"
 #include "settings/spin_range.h"
 #include "texts/texts.h"
 
@@ -29,6 +33,28 @@ std::optional<int32_t> ReadNumber(std::string_view value, ValueSource source) {
   return ParseNumber(value);
 }
 
+// "#RRGGBB", "#RGB" or a CSS name, as the stored number; not a color that shines through.
+std::optional<int32_t> ReadColorText(std::string_view text) {
+  AlphaColor color;
+  if (!ReadColor(text, color) || color.alpha != 255) return std::nullopt;
+  return color.red | color.green << 8 | color.blue << 16;
+}
+
+std::optional<int32_t> ReadFlagWord(std::string_view text) {
+  constexpr std::string_view kWords[] = {"no", "yes", "false", "true", "off", "on"};
+  for (size_t i = 0; i < std::size(kWords); ++i) {
+    if (EqualIgnoringCase(text, kWords[i])) return static_cast<int32_t>(i % 2);
+  }
+  return std::nullopt;
+}
+
+// What a key of that kind may be written as beside its number.
+std::optional<int32_t> ReadWord(const KeyRow& row, std::string_view text) {
+  if ((row.type & KEY_COLOR) != 0) return ReadColorText(text);
+  if ((row.type & KEY_FLAG) != 0 && !IsLooseFlag(row)) return ReadFlagWord(text);
+  return std::nullopt;
+}
+
 bool IsInList(const KeyRow& row, int32_t number) {
   int32_t position = 0;
   for (const ChoiceEntry* entry = row.extra.choices; entry->text != nullptr; ++entry, ++position) {
@@ -44,27 +70,18 @@ ValueFault NumberFault(const KeyRow& row, int32_t number) {
     return number >= 0 && number <= kMostColor ? ValueFault::None : ValueFault::NotColor;
   if ((row.type & KEY_CHOICE) != 0)
     return IsInList(row, number) ? ValueFault::None : ValueFault::NotChoice;
-  if ((row.type & KEY_SPIN) != 0) {
-    const SpinRange range = SpinRangeOf(row);
-    return number >= range.minimum && number <= range.maximum ? ValueFault::None
-                                                              : ValueFault::OutOfRange;
-  }
-  return ValueFault::None;
+  const std::optional<SpinRange> range = LimitsOf(row);
+  const bool outside = range && (number < range->minimum || number > range->maximum);
+  return outside ? ValueFault::OutOfRange : ValueFault::None;
 }
 
 SettingValue ReadNumberValue(const KeyRow& row, std::string_view text, ValueSource source) {
   SettingValue value;
-  const std::optional<int32_t> number = ReadNumber(text, source);
-  if (!number) {
-    value.fault = (row.type & KEY_FLAG) != 0 ? ValueFault::NotFlag : ValueFault::NotNumber;
-    value.usable = false;
-    return value;
-  }
-  value.number = *number;
-  value.fault = NumberFault(row, *number);
-  value.usable = value.fault == ValueFault::None ||
-                 (source == ValueSource::File && value.fault != ValueFault::NotColor);
-  if (value.fault == ValueFault::NotFlag) value.number = 1;
+  const std::optional<int32_t> word = ReadWord(row, text);
+  const std::optional<int32_t> number = word ? word : ReadNumber(text, source);
+  value.fault = number ? NumberFault(row, *number) : ValueFault::NotNumber;
+  value.usable = value.fault == ValueFault::None;
+  value.number = number.value_or(0);
   return value;
 }
 
@@ -94,6 +111,27 @@ std::string ListText(const KeyRow& row) {
     text += (position == 0 ? "" : ", ") + std::to_string(number) + " (" + Tr(entry->text) + ")";
   }
   return text;
+}
+
+std::string ColorText(int32_t number) {
+  const auto color = static_cast<uint32_t>(number);
+  char text[16];
+  std::snprintf(text, sizeof text, "#%02X%02X%02X", color & 0xFF, color >> 8 & 0xFF,
+                color >> 16 & 0xFF);
+  return text;
+}
+
+std::string NumberValues(const KeyRow& row) {
+  if ((row.type & KEY_FLAG) != 0 && !IsLooseFlag(row)) return Tr("yes or no (1 or 0)");
+  if ((row.type & KEY_COLOR) != 0) {
+    return Tr(
+        "a color: #RRGGBB, a name such as orange, or the number blue * 65536 + green * 256 + red");
+  }
+  if ((row.type & KEY_CHOICE) != 0) return ListText(row);
+  const std::optional<SpinRange> range = LimitsOf(row);
+  if (!range) return Tr("a whole number");
+  if (range->maximum == INT32_MAX) return Tr("a number of at least %1", range->minimum);
+  return Tr("a number from %1 to %2", range->minimum, range->maximum);
 }
 
 }  // namespace
@@ -130,20 +168,30 @@ std::string DefaultValueText(const KeyRow& row) {
                                     : std::to_string(DefaultNumber(row));
 }
 
+std::string ValuesText(const KeyRow& row) {
+  if ((row.type & KEY_INTERNAL) != 0) return Tr("nothing: the program sets it");
+  if ((row.type & KEY_TEXT) == 0) return NumberValues(row);
+  if ((row.type & KEY_DESTINATION) != 0) return Tr("the extension of a format that can be written");
+  if (HoldsName(row)) return Tr("part of a file name, at most %1 characters", TextLimit(row));
+  return Tr("a text of at most %1 characters", TextLimit(row));
+}
+
+std::string ReadableValue(const KeyRow& row) {
+  return (row.type & KEY_COLOR) != 0 ? ColorText(NumberIn(row)) : ValueText(row);
+}
+
+std::string ReadableDefault(const KeyRow& row) {
+  return (row.type & KEY_COLOR) != 0 ? ColorText(DefaultNumber(row)) : DefaultValueText(row);
+}
+
 std::string FaultMessage(const KeyRow& row, ValueFault fault) {
   switch (fault) {
     case ValueFault::None: return {};
-    case ValueFault::NotNumber: return Tr("%1 takes a whole number.", row.name);
+    case ValueFault::NotNumber:
     case ValueFault::NotFlag:
-      return IsLooseFlag(row) ? Tr("%1 takes a whole number.", row.name)
-                              : Tr("%1 takes 0 or 1.", row.name);
     case ValueFault::NotColor:
-      return Tr("%1 takes a color: blue * 65536 + green * 256 + red, or 0xBBGGRR.", row.name);
-    case ValueFault::NotChoice: return Tr("%1 takes %2.", row.name, ListText(row));
-    case ValueFault::OutOfRange: {
-      const SpinRange range = SpinRangeOf(row);
-      return Tr("%1 takes a number from %2 to %3.", row.name, range.minimum, range.maximum);
-    }
+    case ValueFault::NotChoice:
+    case ValueFault::OutOfRange: return Tr("%1 takes %2.", row.name, ValuesText(row));
     case ValueFault::TooLong:
       return Tr("%1 takes at most %2 characters.", row.name, TextLimit(row));
     case ValueFault::NotText: return Tr("%1 takes no line breaks and no NUL bytes.", row.name);

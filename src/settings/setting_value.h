@@ -11,11 +11,11 @@ namespace fotomill {
 // What is wrong with a value.
 enum class ValueFault {
   None,
-  NotNumber,   // not a whole number of 32 bits
+  NotNumber,   // neither a whole number of 32 bits nor a word that the key takes
   NotFlag,     // neither 0 nor 1
-  NotColor,   // not a number of 24 bits
+  NotColor,    // not a number of 24 bits
   NotChoice,   // not in the choice list
-  OutOfRange,  // outside the spin control's range
+  OutOfRange,  // outside the key's limits
   TooLong,     // longer than the key's limit
   NotText,     // holds a line break or a zero byte
   NotName,     // part of a file name that leads elsewhere
@@ -35,9 +35,9 @@ struct SettingValue {
 };
 
 // Reads a value as it is in the configuration file or on a command line, whole and with its blanks.
-// Numbers are decimal; a person may write 0x. From a file a flag is 1 for any number but 0, a text
-// with a limit is cut to it, and numbers outside their list or range stay, since whoever acts on
-// them must be ready for them anyway.
+// Numbers are decimal; a person may write 0x. A color may also be #RRGGBB, #RGB or a CSS name, a
+// flag yes, no, true, false, on or off. What a key does not take is not usable, with one exception:
+// a text with a limit that comes from a file is cut to it.
 SettingValue ReadValue(const KeyRow& row, std::string_view value, ValueSource source);
 
 // Stores a value that is usable.
@@ -49,8 +49,13 @@ bool HoldsValue(const KeyRow& row, const SettingValue& value);
 std::string ValueText(const KeyRow& row);
 std::string DefaultValueText(const KeyRow& row);  // as the file would say it
 
-// What the key takes, for people: "PngCompression takes a number from 0 to 9." Empty without a
-// fault.
+// The same for people: a color as #RRGGBB.
+std::string ReadableValue(const KeyRow& row);
+std::string ReadableDefault(const KeyRow& row);  // likewise
+
+// What the key takes, for people: "a number from 0 to 9".
+std::string ValuesText(const KeyRow& row);
+// As a whole sentence: "PngCompression takes a number from 0 to 9." Empty without a fault.
 std::string FaultMessage(const KeyRow& row, ValueFault fault);
 
 }  // namespace fotomill

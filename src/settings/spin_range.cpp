@@ -16,7 +16,13 @@ struct KeyRange {
 // clang-format off
 constexpr KeyRange kRanges[] = {
     {KeyNumber::BrowserThumbnailPrecacheDelay, {0, 60000, 50}},   // milliseconds
+    {KeyNumber::DitherBrightness,              {-100, 100, 1}},
+    {KeyNumber::DitherContrast,                {-100, 100, 1}},
     {KeyNumber::FaceDetectPercentage,          {0, 100,   1}},
+    {KeyNumber::FXBrightness,                  {-100, 100, 1}},
+    {KeyNumber::FXContrast,                    {-100, 100, 1}},
+    {KeyNumber::FXGrayLevel,                   {0, 256,   1}},    // shades, 0: all
+    {KeyNumber::FXThreshold,                   {0, 255,   1}},    // 0: automatic
     {KeyNumber::HDPCompression,                {0, 255,   1}},    // quantizer, 0 is lossless
     {KeyNumber::JpegCompression,               {0, 100,   1}},    // quality
     {KeyNumber::MaximumPreviewDimension,       {16, 65535, 16}},  // pixels
@@ -30,11 +36,15 @@ constexpr KeyRange kRanges[] = {
 
 }  // namespace
 
-SpinRange SpinRangeOf(const KeyRow& row) {
+std::optional<SpinRange> LimitsOf(const KeyRow& row) {
   for (const KeyRange& range : kRanges) {
     if (&KeyOf(range.key) == &row) return range.range;
   }
-  return {0, std::numeric_limits<int32_t>::max(), 1};
+  return std::nullopt;
+}
+
+SpinRange SpinRangeOf(const KeyRow& row) {
+  return LimitsOf(row).value_or(SpinRange{0, std::numeric_limits<int32_t>::max(), 1});
 }
 
 std::string SpinRangeText(const SpinRange& range) {

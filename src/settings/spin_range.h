@@ -14,6 +14,8 @@ struct SpinRange {
   int32_t minimum = 0, maximum = 0, step = 1;
 };
 
+// The limits of a number; nullopt for a key that takes any.
+std::optional<SpinRange> LimitsOf(const KeyRow& row);
 // The range of a KEY_SPIN row. Setup dialogs put its text into the control numbered `control` +
 // kSpinRangeControl, from where the binding reads it, so that a dialog may offer less.
 SpinRange SpinRangeOf(const KeyRow& row);

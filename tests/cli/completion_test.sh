@@ -1,6 +1,6 @@
 #!/bin/bash
-# Completes command lines with the script that the program prints for bash; zsh runs the same one.
-# The script for fish is read by fish where there is one.
+# Completes command lines with the scripts that the program prints: bash here, zsh and fish where
+# there are such shells.
 set -u
 faults=0
 source <("$FOTOMILL" completion bash) || exit 1
@@ -31,8 +31,87 @@ check fotomill info tw "two words.bmp"
 check fotomill --vers "--version"
 check fotomill completion b "bash"
 
+check fotomill config describe UndoL "UndoLevels"
+check fotomill config set ThumbnailMat "ThumbnailMatte"
+check fotomill --set UndoL "UndoLevels="
+check fotomill --color = al "always"
+check fotomill turn x.bmp --rotate l "left"
+check fotomill operations sharp "sharpen"
+check fotomill completion p "powershell"
+check fotomill help config des "describe"
+check fotomill convert --jobs 4 ""
+check fotomill info --js "--json"
+COMP_TYPE=63
+check fotomill config un "unset"
+COMP_WORDS=(fotomill config "") COMP_CWORD=2 COLUMNS=60
+_fotomill
+[[ "${COMPREPLY[*]}" == *"describe                 (explain keys"* ]] || { echo "bash shows no descriptions: ${COMPREPLY[*]}"; faults=1; }
+unset COMP_TYPE
+
+# zsh and fish complete the same, where there are such shells.
+if command -v zsh > /dev/null; then
+  "$FOTOMILL" completion zsh > "$folder/_fotomill"
+  zshWords() { # WORD...: what _describe is given, or *files
+    zsh -f -c '
+      compdef() { :; }; compset() { :; }; _files() { print "*files"; }
+      _describe() { print -rl -- "${(@P)4}"; }
+      source '"$folder"'/_fotomill
+      words=("$@"); CURRENT=$#; _fotomill' zsh "$@"
+  }
+  zshCheck() {
+    local expected=${*: -1} found
+    found=$(zshWords "${@:1:$#-1}" 2>&1)
+    grep -qF -- "$expected" <<< "$found" && return
+    echo "zsh, ${*:1:$#-1}: \"$expected\" is not in \"${found:0:300}\""
+    faults=1
+  }
+  zshCheck fotomill "" "convert:convert pictures to another format"
+  zshCheck fotomill config "" "unset:reset a key to its default"
+  zshCheck fotomill --color never config get "" "UndoLevels:How many file operations"
+  zshCheck fotomill config get "" "ArchiveSortMode:not used by this build"
+  zshCheck fotomill --set "" "UndoLevels=:How many"
+  zshCheck fotomill convert --overwrite "" "keep-both:"
+  zshCheck fotomill convert --overwrite= "keep-both:"
+  zshCheck fotomill convert -t "" "png:(PNG)"
+  zshCheck fotomill convert -- "--quality:"
+  zshCheck fotomill convert "" "*files"
+fi
+
 if command -v fish > /dev/null; then
-  found=$(fish --no-config -c 'source (eval $FOTOMILL completion fish | psub); complete -C "fotomill config g"' 2>&1)
-  [[ "$found" == get* ]] || { echo "fish: $found"; faults=1; }
+  "$FOTOMILL" completion fish > "$folder/fotomill.fish"
+  fishCheck() { # LINE EXPECTED
+    local found
+    found=$(fish --no-config -c "source $folder/fotomill.fish; complete -C '$1'" 2>&1)
+    grep -qF -- "$2" <<< "$found" && return
+    echo "fish, $1: \"$2\" is not in \"${found:0:300}\""
+    faults=1
+  }
+  fishCheck "fotomill config g" "get	print the values of keys"
+  fishCheck "fotomill --color never config get UndoL" "UndoLevels	How many file operations"
+  fishCheck "fotomill --set UndoL" "UndoLevels="
+  fishCheck "fotomill convert --overwrite k" "keep-both"
+  fishCheck "fotomill convert --overwrite=k" "keep-both"
+  fishCheck "fotomill convert --js" "--json	Print a JSON array"
+  fishCheck "fotomill convert --json two" "two words.bmp"
+  fishCheck "fotomill completion z" "zsh"
+fi
+
+# The lists of the script for PowerShell, which is rarely there to try it: balanced, and quotes doubled.
+"$FOTOMILL" completion powershell > "$folder/fotomill.ps1"
+python3 - "$folder/fotomill.ps1" << 'END' || faults=1
+import re, sys
+text = open(sys.argv[1], encoding="utf-8").read()
+bare = re.sub(r"'(?:[^']|'')*'", "''", text)
+entries = re.findall(r"^    '((?:[^']|'')*)' = ", text, re.M)
+wrong = [name for name, bad in [
+    ("quotes", "'" in bare.replace("''", "")), ("brackets", any(bare.count(a) != bare.count(b) for a, b in ("()", "{}", "[]"))),
+    ("places that differ in case only", len({entry.lower() for entry in entries}) != len(entries)),
+    ("commands", "second:config" not in entries or "argument:convert" not in entries)] if bad]
+if wrong:
+    sys.exit("PowerShell: " + ", ".join(wrong))
+END
+if command -v pwsh > /dev/null; then
+  found=$(pwsh -NoProfile -Command ". $folder/fotomill.ps1; (TabExpansion2 'fotomill config g' 17).CompletionMatches.CompletionText")
+  [[ "$found" == get ]] || { echo "PowerShell: $found"; faults=1; }
 fi
 exit $faults

@@ -108,7 +108,7 @@ TEST_F(Convert, FailuresLeaveNothingBehindAndStopNobody) {
   }
   EXPECT_THAT(statuses, ElementsAre(2, 1, 10, 10, 0));
   EXPECT_THAT(Names("out"), ElementsAre("a.pcx", "mono.pcx", "top.pcx"));
-  EXPECT_TRUE(result.Says("There were errors\n5 files were processed.")) << result.err;
+  EXPECT_TRUE(result.Says("4 files failed.\nThere were errors\n5 files were processed.")) << result.err;
 
   EXPECT_EQ(Run({In("a.bmp"), "-o", In("no/such/folder.pcx")}).status, 1);
   const CommandResult tooLong = Run({In("a.bmp"), "-t", "pcx", "-d", In(std::string(240, 'd'))});

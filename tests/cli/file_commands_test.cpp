@@ -117,7 +117,7 @@ TEST_F(FileCommands, WhatCannotBeOpenedFailsAloneWithAMessage) {
       EXPECT_EQ(array[0]["file"], path);
       EXPECT_EQ(array[0]["status"], row.number);
       EXPECT_EQ(array[1]["status"], 0);
-      EXPECT_EQ(result.err, path + ": " + row.message + "\nThere were errors\n2 files were processed.\n");
+      EXPECT_EQ(result.err, path + ": " + row.message + "\nThere were errors\n2 files were processed, 1 failed.\n");
     }
   }
   EXPECT_EQ(RunCommand({"info", In("empty.bmp")}).status, 1);

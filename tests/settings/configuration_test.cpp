@@ -7,6 +7,7 @@
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "settings/settings.h"
+#include "settings/spin_range.h"
 #include "support/child.h"
 #include "support/faults.h"
 #include "support/files.h"
@@ -55,15 +56,22 @@ TEST_F(ConfigurationTest, TakesWhatTheFileHolds) {
       {"no number", "JpegCompression=80%", "JpegCompression", "75", ValueFault::NotNumber},
       {"hexadecimal is no number here", "JpegCompression=0x50", "JpegCompression", "75", ValueFault::NotNumber},
       {"empty number", "JpegCompression=", "JpegCompression", "75", ValueFault::NotNumber},
-      {"out of its range", "PngCompression=12", "PngCompression", "12", ValueFault::OutOfRange},
+      {"out of its range", "PngCompression=12", "PngCompression", "9", ValueFault::OutOfRange},
+      {"out of the limits of a key without spin control", "FXBrightness=101", "FXBrightness", "0", ValueFault::OutOfRange},
       {"flag", "WriteOS2Bitmaps=1", "WriteOS2Bitmaps", "1"},
-      {"flag of another number", "WriteOS2Bitmaps=-7", "WriteOS2Bitmaps", "1", ValueFault::NotFlag},
+      {"flag of another number", "WriteOS2Bitmaps=-7", "WriteOS2Bitmaps", "0", ValueFault::NotFlag},
+      {"flag as a word", "WriteOS2Bitmaps=Yes", "WriteOS2Bitmaps", "1"},
+      {"flag as another word", "UseAlphaChannels=off", "UseAlphaChannels", "0"},
+      {"flag as no word", "UseAlphaChannels=maybe", "UseAlphaChannels", "1", ValueFault::NotNumber},
       {"flag that keeps its number", "FileTipDelay=750", "FileTipDelay", "750"},
       {"color", "AlphaBackground=255", "AlphaBackground", "255"},
       {"color of 25 bits", "AlphaBackground=16777216", "AlphaBackground", "16777215", ValueFault::NotColor},
       {"negative color", "AlphaBackground=-1", "AlphaBackground", "16777215", ValueFault::NotColor},
+      {"color in red, green and blue", "AlphaBackground=#FF8000", "AlphaBackground", "33023"},
+      {"color by name", "AlphaBackground=Orange", "AlphaBackground", "42495"},
+      {"color that shines through", "AlphaBackground=#FF800080", "AlphaBackground", "16777215", ValueFault::NotNumber},
       {"choice by value", "DropOptions=101", "DropOptions", "101"},
-      {"choice not in the list", "DropOptions=1", "DropOptions", "1", ValueFault::NotChoice},
+      {"choice not in the list", "DropOptions=1", "DropOptions", "102", ValueFault::NotChoice},
       {"choice beyond its list by default", "JpegProcessor=2", "JpegProcessor", "2"},
       {"misspelt by its true name", "FindSimlarDistance=3", "FindSimlarDistance", "3"},
       {"the same, spelt well", "FindSimilarDistance=3", "FindSimlarDistance", "10"},
@@ -161,6 +169,13 @@ TEST_F(ConfigurationTest, EveryKeyComesBackAsItWasSaved) {
     if ((row.type & KEY_TEXT) != 0)
       return std::string(1, ' ').append(row.name).substr(0, 28).append(1, ' ');
     if ((row.type & KEY_FLAG) != 0) return NumberIn(row) != 0 ? "0" : "1";
+    if ((row.type & KEY_BY_VALUE) != 0) {
+      const ChoiceEntry* const first = row.extra.choices;
+      return std::to_string(first->value != NumberIn(row) ? first->value : first[1].value);
+    }
+    if ((row.type & KEY_CHOICE) != 0) return NumberIn(row) == 1 ? "0" : "1";
+    if (const auto range = LimitsOf(row))
+      return std::to_string(NumberIn(row) == range->maximum ? range->minimum : range->maximum);
     return std::to_string(NumberIn(row) == 1 ? 2 : 1);
   };
   for (const KeyRow& row : Keys()) {
@@ -201,12 +216,12 @@ TEST_F(ConfigurationTest, ValuesForOneRunAreNotWritten) {
       {"writeos2bitmaps", "1", SetResult::UnknownKey, "Unknown key \"writeos2bitmaps\"; the nearest is WriteOS2Bitmaps."},
       {"JpegCompression", "101", SetResult::WrongValue, "JpegCompression takes a number from 0 to 100."},
       {"TiffResolution", "0", SetResult::WrongValue, "TiffResolution takes a number from 1 to 32767."},
-      {"JpegCompression", "many", SetResult::WrongValue, "JpegCompression takes a whole number."},
-      {"WriteOS2Bitmaps", "2", SetResult::WrongValue, "WriteOS2Bitmaps takes 0 or 1."},
+      {"JpegCompression", "many", SetResult::WrongValue, "JpegCompression takes a number from 0 to 100."},
+      {"WriteOS2Bitmaps", "2", SetResult::WrongValue, "WriteOS2Bitmaps takes yes or no (1 or 0)."},
       {"ExtensionCaseStyle", "3", SetResult::WrongValue,
        "ExtensionCaseStyle takes 0 (As in the source file's name), 1 (Upper case), 2 (Lower case)."},
       {"AlphaBackground", "0x1000000", SetResult::WrongValue,
-       "AlphaBackground takes a color: blue * 65536 + green * 256 + red, or 0xBBGGRR."},
+       "AlphaBackground takes a color: #RRGGBB, a name such as orange, or the number blue * 65536 + green * 256 + red."},
       {"PrefixCrop", "a name that has thirty-three bytes", SetResult::WrongValue, "PrefixCrop takes at most 32 characters."},
       {"PrefixCrop", "a/b", SetResult::WrongValue,
        "Invalid destination. PrefixCrop takes a name, not a path: no \"/\", \"\\\", \"..\" or control characters."},

@@ -166,8 +166,8 @@ TEST_F(SetupDialogTest, RefusesAllWhenOneIsWrong) {
   };
   const Row rows[] = {
       {JpegCompression, "101", "JpegCompression takes a number from 0 to 100."},
-      {JpegCompression, "", "JpegCompression takes a whole number."},
-      {FXBrightness, "9999999999", "FXBrightness takes a whole number."},
+      {JpegCompression, "", "JpegCompression takes a number from 0 to 100."},
+      {FXBrightness, "9999999999", "FXBrightness takes a number from -100 to 100."},
       {PrefixCrop, "../",
        "Invalid destination. PrefixCrop takes a name, not a path: no \"/\", \"\\\", \"..\" or control characters."},
   };

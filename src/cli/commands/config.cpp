@@ -10,6 +10,7 @@
 #include "core/utf8.h"
 #include "platform/files.h"
 #include "settings/configuration.h"
+#include "settings/key_help.h"
 #include "texts/system_reason.h"
 #include "texts/texts.h"
 
@@ -17,9 +18,12 @@ namespace fotomill::cli {
 
 namespace {
 
+constexpr size_t kTextWidth = 76;  // of explanations
+
 struct ConfigOptions {
   bool json = false;
   bool changed = false;
+  bool used = false;
   bool dryRun = false;
 };
 
@@ -48,6 +52,9 @@ Json KeyElement(const KeyRow& row) {
     element["value"] = NumberIn(row);
     element["default"] = DefaultNumber(row);
   }
+  element["used"] = IsKeyUsed(row);
+  element["values"] = ValuesText(row);
+  element["description"] = KeyHelp(row);
   return element;
 }
 
@@ -78,15 +85,47 @@ void NoteUnreadable(const CommandContext& context) {
   PrintProblem(context, Tr("The configuration file cannot be read; the defaults apply."));
 }
 
+void NoteUnused(const CommandContext& context, ResultOutput& output, const KeyRow& row) {
+  if (!IsKeyUsed(row))
+    output.Note(std::string("fotomill: ") + context.command->name + ": " + UnusedKeyText(row));
+}
+
+// What a key does, in lines below it.
+void Explain(ResultOutput& output, const KeyRow& row) {
+  const auto line = [&](const std::string& text) { output.Line("    " + output.Shown(text)); };
+  line(Tr("Default: %1", ReadableDefault(row)));
+  line(Tr("Takes %1.", ValuesText(row)));
+  if (!IsKeyUsed(row)) return line(UnusedKeyText(row));
+  for (const std::string& text : WrappedLines(KeyHelp(row), kTextWidth)) line(text);
+}
+
+int RunDescribe(const ConfigOptions& options, const CommandContext& context) {
+  std::vector<const KeyRow*> rows;
+  if (!FindKeys(context, rows)) return kExitUsage;
+  NoteUnreadable(context);
+  ResultOutput output(context, options.json);
+  for (const KeyRow* row : rows) {
+    if (output.IsJson()) {
+      output.Element(KeyElement(*row));
+      continue;
+    }
+    output.Line(output.Shown(std::string(row->name) + "=" + ReadableValue(*row)));
+    Explain(output, *row);
+  }
+  return kExitOk;
+}
+
 int RunList(const ConfigOptions& options, const CommandContext& context) {
   NoteUnreadable(context);
   ResultOutput output(context, options.json);
   for (const KeyRow& row : Keys()) {
     if (options.changed && (IsAtDefault(row) || (row.type & KEY_INTERNAL) != 0)) continue;
+    if (options.used && !IsKeyUsed(row)) continue;
     if (output.IsJson()) {
       output.Element(KeyElement(row));
     } else {
       output.Line(output.Shown(std::string(row.name) + "=" + ValueText(row)));
+      if (context.global.verbose) Explain(output, row);
     }
   }
   return kExitOk;
@@ -129,6 +168,7 @@ int Change(const ConfigOptions& options, const CommandContext& context, const Ke
   } else {
     output.Line(output.Shown(std::string(row.name) + ": " + before + " -> " + ValueText(row)));
   }
+  if (value != nullptr) NoteUnused(context, output, row);
   return kExitOk;
 }
 
@@ -178,13 +218,17 @@ std::shared_ptr<ConfigOptions> SetUp(CLI::App& app, CommandContext& context, Run
   return options;
 }
 
-constexpr const char* kKeyJson = TrLater("Print a JSON array of {name, type, value, default}");
+constexpr const char* kKeyJson =
+    TrLater("Print a JSON array of {name, type, value, default, used, values, description}");
 
 }  // namespace
 
 void SetUpConfigList(CLI::App& app, CommandContext& context) {
   const auto options = SetUp(app, context, RunList, kKeyJson, "fotomill config list --changed");
   AddFlag(app, "--changed", options->changed, "Only keys that differ from their defaults");
+  AddFlag(app, "--used", options->used, "Only keys that this build uses");
+  SetFooter(app, "With --verbose, what each key does and which values it takes.",
+            "fotomill config list --changed");
 }
 
 void SetUpConfigGet(CLI::App& app, CommandContext& context) {
@@ -192,10 +236,15 @@ void SetUpConfigGet(CLI::App& app, CommandContext& context) {
   SetUp(app, context, RunGet, kKeyJson, "fotomill config get JpegCompression");
 }
 
+void SetUpConfigDescribe(CLI::App& app, CommandContext& context) {
+  context.names.Declare("KEY...", "Key names", 1);
+  SetUp(app, context, RunDescribe, kKeyJson, "fotomill config describe JpegCompression");
+}
+
 void SetUpConfigSet(CLI::App& app, CommandContext& context) {
   context.names.Declare("KEY VALUE", "Key name and its new value", 2, 2);
   const auto options =
-      SetUp(app, context, RunSet, kKeyJson, "fotomill config set JpegCompression 85");
+      SetUp(app, context, RunSet, kKeyJson, "fotomill config set AlphaBackground '#FFEEDD'");
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would change");
 }
 

@@ -4,10 +4,11 @@
 
 namespace fotomill::cli {
 
-// Commands "config list", "get", "set", "unset" and "path": declare names and options in `app` and
-// set context.run.
+// Commands "config list", "get", "describe", "set", "unset" and "path": declare names and options
+// in `app` and set context.run.
 void SetUpConfigList(CLI::App& app, CommandContext& context);
 void SetUpConfigGet(CLI::App& app, CommandContext& context);
+void SetUpConfigDescribe(CLI::App& app, CommandContext& context);
 void SetUpConfigSet(CLI::App& app, CommandContext& context);
 void SetUpConfigUnset(CLI::App& app, CommandContext& context);
 void SetUpConfigPath(CLI::App& app, CommandContext& context);

@@ -49,7 +49,6 @@ struct ConvertOptions {
   int32_t jobs = 0;
   bool reduce = false;
   bool autoOrient = false;
-  bool verbose = false;
   bool keepTree = false;
   bool keepTimes = false;
   bool dryRun = false;
@@ -239,7 +238,7 @@ int RunConvert(ConvertOptions options, const CommandContext& context) {
   job.destinationFolder = options.dest;
   job.prompts = context.MayAsk() ? &prompts : nullptr;
   SetOverwritePolicy(options, context, job);
-  TerminalBox box(output, options.verbose,
+  TerminalBox box(output, context.global.verbose,
                   !streams && options.overwrite.empty() && !job.overwrite.prompt);
   job.box = &box;
   StreamedOutput stream;
@@ -293,7 +292,6 @@ void SetUp(CLI::App& app, CommandContext& context, const std::shared_ptr<Convert
   AddNumber(app, "-j,--jobs", options->jobs, "N", 0, INT32_MAX,
             "Number of parallel jobs (default: 0, one per core)");
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be done");
-  AddFlag(app, "-v,--verbose", options->verbose, "Report metadata that the format cannot store");
   AddFlag(app, "--json", options->json,
           "Print a JSON array of {file, destination, status, message}");
   context.run = [options, &context] { return RunConvert(*options, context); };

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <map>
+#include <memory>
 #include <string>
 
 #include "cli/frame/libraries.h"
@@ -25,10 +26,17 @@ namespace fotomill::cli {
 
 namespace {
 
-void Report(ResultOutput& output, std::string_view label, std::string_view fact) {
+// One fact; the label in English.
+void Report(ResultOutput& output, const std::string& label, std::string_view fact) {
   constexpr size_t kColumn = 16;
-  const size_t width = CharacterCount(label);
-  output.Line(std::string(label).append(width < kColumn ? kColumn - width : 1, ' ') +
+  if (output.IsJson()) {
+    Json element{{"item", label.substr(std::min(label.find_first_not_of(' '), label.size()))}};
+    PutName(element, "value", fact);
+    return output.Element(element);
+  }
+  const std::string shown = Tr(label);
+  const size_t width = CharacterCount(shown);
+  output.Line(shown + std::string(width < kColumn ? kColumn - width : 1, ' ') +
               EscapeControls(fact));
 }
 
@@ -40,7 +48,7 @@ std::string FolderFact(const std::string& folder) {
 }
 
 void ReportConfiguration(ResultOutput& output) {
-  Report(output, Tr("Data folder"), FolderFact(DataFolder()));
+  Report(output, TrLater("Data folder"), FolderFact(DataFolder()));
   std::string path = ConfigurationPath();
   switch (StateOfConfiguration()) {
     case ConfigurationState::NotLoaded:
@@ -52,9 +60,11 @@ void ReportConfiguration(ResultOutput& output) {
       break;
     case ConfigurationState::Loaded: break;
   }
-  Report(output, Tr("Configuration"), path);
+  Report(output, TrLater("Configuration"), path);
   for (const ValueComplaint& complaint : ConfigurationComplaints()) {
-    Report(output, "  " + Tr("line %1", complaint.line),
+    const std::string line = output.IsJson() ? "line " + std::to_string(complaint.line)
+                                             : "  " + Tr("line %1", complaint.line);
+    Report(output, line,
            std::string(complaint.row->name) + "=" + complaint.value + ": " +
                FaultMessage(*complaint.row, complaint.fault));
   }
@@ -70,7 +80,7 @@ bool IsRegistered(const std::string& path) {
 // The formats of each module, and the modules without one.
 void ReportPlugins(ResultOutput& output, bool enabled) {
   for (const std::string& folder : PluginFolders()) {
-    Report(output, Tr("Plug-in folder"),
+    Report(output, TrLater("Plug-in folder"),
            enabled ? FolderFact(folder) : Tr("%1 (disabled by --no-plugins)", FolderFact(folder)));
   }
   if (!enabled) return;
@@ -107,23 +117,27 @@ void ReportFormats(ResultOutput& output) {
     if (row.enabled == 0) off += extension;
     if (!WhyNot(row).empty()) reasons[Tr(WhyNot(row))] += extension;
   }
-  Report(output, Tr("Formats"), Tr("%1 can be read, %2 can be written", readable, writable));
-  if (!off.empty()) output.Line(std::string("  ") + Tr("Disabled:") + off);
+  Report(output, TrLater("Formats"), Tr("%1 can be read, %2 can be written", readable, writable));
+  const auto list = [&](const std::string& title, const std::string& extensions) {
+    if (!output.IsJson()) return output.Line("  " + title + ":" + extensions);
+    output.Element({{"item", title}, {"value", extensions.substr(1)}});
+  };
+  if (!off.empty()) list(Tr("Disabled"), off);
   for (const auto& [reason, extensions] : reasons)
-    output.Line("  " + reason.substr(0, reason.size() - 1) + ":" + extensions);
+    list(reason.substr(0, reason.size() - 1), extensions);
 }
 
-int RunDoctor(const CommandContext& context) {
-  ResultOutput output(context, false);
-  Report(output, Tr("Version"), FOTOMILL_VERSION);
-  Report(output, Tr("Program"), platform::ProgramPath());
+int RunDoctor(const CommandContext& context, bool json) {
+  ResultOutput output(context, json);
+  Report(output, TrLater("Version"), FOTOMILL_VERSION);
+  Report(output, TrLater("Program"), platform::ProgramPath());
   ReportConfiguration(output);
-  Report(output, Tr("Temporary files"),
+  Report(output, TrLater("Temporary files"),
          FolderFact(platform::SpecialFolderPath(platform::SpecialFolder::Temporary)));
-  Report(output, Tr("Cores"), std::to_string(platform::CoreCount()));
+  Report(output, TrLater("Cores"), std::to_string(platform::CoreCount()));
   ReportPlugins(output, !context.global.noPlugins);
   for (const Library& library : Libraries()) {
-    Report(output, Tr("Library"),
+    Report(output, TrLater("Library"),
            Tr("%1 %2, for %3", library.name, library.version, Tr(library.purpose)));
   }
   ReportFormats(output);
@@ -133,8 +147,10 @@ int RunDoctor(const CommandContext& context) {
 }  // namespace
 
 void SetUpDoctor(CLI::App& app, CommandContext& context) {
+  const auto json = std::make_shared<bool>(false);
+  AddFlag(app, "--json", *json, "Print a JSON array of {item, value}");
   SetFooter(app, nullptr, "fotomill doctor");
-  context.run = [&context] { return RunDoctor(context); };
+  context.run = [json, &context] { return RunDoctor(context, *json); };
 }
 
 }  // namespace fotomill::cli

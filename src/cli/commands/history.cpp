@@ -108,7 +108,7 @@ int RunAdd(const HistoryOptions& options, const CommandContext& context) {
     hint = Tr("The file history takes paths of up to 260 bytes, without tabs and line breaks.");
   }
   if (status != Status::Ok) {
-    output.Failure(name, status, hint);
+    output.FileFailed(name, status, hint);
     return output.Finish();
   }
   const std::string line = output.ShownMessage(name) + ": ";
@@ -125,20 +125,34 @@ int RunAdd(const HistoryOptions& options, const CommandContext& context) {
   }
   if (recorded == 0)
     output.Note(line + Tr("not recorded; FileHistoryFunctions excludes this function."));
+  if (output.IsJson()) {
+    Json element;
+    PutName(element, "path", use.path);
+    element["function"] = function;
+    element["functionName"] = FileFunctionName(function);
+    element["recorded"] = recorded > 0;
+    output.Element(element);
+  }
   return kExitOk;
 }
 
 int RunClear(const HistoryOptions& options, const CommandContext& context) {
   const std::string path = FileHistoryPath(HistoryOptionsFromSettings());
   ClearFileHistory();
+  ResultOutput output(context, options.json);
   if (path.empty() || !platform::FileExists(path)) return kExitOk;
   if (options.dryRun) {
-    ResultOutput(context, false).Note(path + ": " + Tr("would be deleted."));
-    return kExitOk;
+    output.Note(output.ShownMessage(path) + ": " + Tr("would be deleted."));
+  } else if (!platform::DeleteFile(path)) {
+    return Complain(context, TrLater("The file history could not be deleted."));
   }
-  return platform::DeleteFile(path)
-             ? kExitOk
-             : Complain(context, TrLater("The file history could not be deleted."));
+  if (output.IsJson()) {
+    Json element;
+    PutName(element, "path", path);
+    element["deleted"] = !options.dryRun;
+    output.Element(element);
+  }
+  return kExitOk;
 }
 
 using Run = int (*)(const HistoryOptions& options, const CommandContext& context);
@@ -170,11 +184,14 @@ void SetUpHistoryAdd(CLI::App& app, CommandContext& context) {
   AddNumber(app, "--accessed", options->accessed, "SECONDS", INT32_MIN, INT32_MAX,
             "When it was used, in seconds since 1970 UTC (default: now)");
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be recorded");
+  AddFlag(app, "--json", options->json,
+          "Print a JSON array of {path, function, functionName, recorded}");
 }
 
 void SetUpHistoryClear(CLI::App& app, CommandContext& context) {
   const auto options = SetUp(app, context, RunClear, "fotomill history clear");
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be deleted");
+  AddFlag(app, "--json", options->json, "Print a JSON array of {path, deleted}");
 }
 
 }  // namespace fotomill::cli

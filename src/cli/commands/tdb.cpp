@@ -46,16 +46,16 @@ bool OpenDatabase(ThumbnailDatabase& database, const std::string& path, bool cre
                   ResultOutput& output) {
   switch (database.OpenThumbnailDatabase(path, create, ThumbnailOptionsFromSettings().hidden)) {
     case ThumbnailDatabase::Opened::Done: return true;
-    case ThumbnailDatabase::Opened::Missing: output.Failure(path, Status::FileOpenError); break;
+    case ThumbnailDatabase::Opened::Missing: output.FileFailed(path, Status::FileOpenError); break;
     case ThumbnailDatabase::Opened::NotRead:
       if (const std::string reason = ReasonSentence(); !reason.empty()) {
-        output.Failure(path, Status::FileOpenError, reason);
+        output.FileFailed(path, Status::FileOpenError, reason);
       } else {
-        output.Failure(path, Status::DamagedFile, Tr(kNoDatabase));
+        output.FileFailed(path, Status::DamagedFile, Tr(kNoDatabase));
       }
       break;
     case ThumbnailDatabase::Opened::Failed:
-      output.Failure(path, Status::ErrorCreatingFile, ReasonSentence());
+      output.FileFailed(path, Status::ErrorCreatingFile, ReasonSentence());
       break;
   }
   return false;
@@ -92,7 +92,7 @@ class Appending {
   void Add(const SelectedFile& file, Adding& adding) {
     if (adding.status != Status::Ok) {
       Flush();
-      output_.Failure(file.name, adding.status, adding.hint);
+      output_.FileFailed(file.name, adding.status, adding.hint);
       return;
     }
     names_.push_back(file.name);
@@ -104,12 +104,11 @@ class Appending {
     const bool added = records_.empty() || database_.AppendDatabaseRecords(records_, true);
     for (const std::string& name : names_) {
       if (!added) {
-        output_.Failure(name, Status::ErrorWritingFile, Tr(kNotAdded));
+        output_.FileFailed(name, Status::ErrorWritingFile, Tr(kNotAdded));
         continue;
       }
-      output_.CountFile();
       used_.Add(name);
-      output_.Line(output_.Shown(name));
+      output_.FileDone(name);
     }
     names_.clear();
     records_.clear();
@@ -157,17 +156,16 @@ int RunAdd(const TdbOptions& options, CommandContext& context) {
   context.names.values.erase(context.names.values.begin());
   const auto selection = SelectFiles(options.selection, context);
   if (!selection) return kExitUsage;
-  ResultOutput output(context, false);
+  ResultOutput output(context, options.json);
   output.CloseWith(selection->leftOut);
   output.KeepGoing();
   if (options.dryRun) {
     for (const SelectedFile& file : selection->files) {
       if (file.status != Status::Ok) {
-        output.Failure(file.name, file.status, file.hint);
+        output.FileFailed(file.name, file.status, file.hint);
         continue;
       }
-      output.CountFile();
-      output.Line(output.Shown(file.name));
+      output.FileDone(file.name);
     }
     return output.Finish();
   }
@@ -180,25 +178,24 @@ int RunAdd(const TdbOptions& options, CommandContext& context) {
 
 int RunFind(const TdbOptions& options, CommandContext& context) {
   const std::string &path = context.names.values[0], &name = context.names.values[1];
-  ResultOutput output(context, false);
+  ResultOutput output(context, options.json);
   ThumbnailDatabase database;
   if (!OpenDatabase(database, path, false, output)) return output.Finish();
   const std::string picture = platform::AbsolutePath(name);
   ThumbnailRecord record;
   if (!database.Find(picture, VolumeKeyFor(picture), record)) {
-    output.Failure(name, Status::NoImages, Tr(kNotFound));
+    output.FileFailed(name, Status::NoImages, Tr(kNotFound));
     return output.Finish();
   }
   if (options.overwrite != "replace" && platform::FileExists(options.out)) {
-    output.Failure(options.out, Status::ErrorCreatingFile, Tr(kExists));
+    output.FileFailed(options.out, Status::ErrorCreatingFile, Tr(kExists));
     return output.Finish();
   }
   if (!WriteThumbnailFile(record, options.out, ThumbnailOptionsFromSettings().hidden)) {
-    output.Failure(options.out, Status::ErrorCreatingFile, ReasonSentence());
+    output.FileFailed(options.out, Status::ErrorCreatingFile, ReasonSentence());
     return output.Finish();
   }
-  output.CountFile();
-  output.Line(output.Shown(name) + " -> " + output.Shown(options.out));
+  output.FileDone(name, options.out);
   return output.Finish();
 }
 
@@ -263,7 +260,7 @@ int64_t CountRecords(const ThumbnailDatabase& database, Test test) {
 
 int RunDelete(const TdbOptions& options, CommandContext& context) {
   const std::string& path = context.names.values[0];
-  ResultOutput output(context, false);
+  ResultOutput output(context, options.json);
   ThumbnailDatabase database;
   if (!OpenDatabase(database, path, false, output)) return output.Finish();
   for (size_t i = 1; i < context.names.values.size() && output.GoesOn(); ++i) {
@@ -276,12 +273,11 @@ int RunDelete(const TdbOptions& options, CommandContext& context) {
                                                })
                                 : database.Delete(picture);
     if (deleted < 1) {
-      output.Failure(name, deleted == 0 ? Status::NoImages : Status::ErrorWritingFile,
-                     deleted == 0 ? Tr(kNotFound) : "");
+      output.FileFailed(name, deleted == 0 ? Status::NoImages : Status::ErrorWritingFile,
+                        deleted == 0 ? Tr(kNotFound) : "");
       continue;
     }
-    output.CountFile();
-    output.Line(output.Shown(name));
+    output.FileDone(name);
   }
   return output.Finish();
 }
@@ -297,9 +293,19 @@ class CompactionProgress : public ProgressSink {
   ResultOutput& output_;
 };
 
+void ReportCompaction(ResultOutput& output, const std::string& path, int64_t before,
+                      int64_t after) {
+  if (!output.IsJson()) return output.Line(Tr("%1 -> %2 records", before, after));
+  Json element;
+  PutName(element, "database", path);
+  element["before"] = before;
+  element["after"] = after;
+  output.Element(element);
+}
+
 int RunCompact(const TdbOptions& options, CommandContext& context) {
   const std::string& path = context.names.values[0];
-  ResultOutput output(context, false);
+  ResultOutput output(context, options.json);
   ThumbnailDatabase database;
   DatabaseHeader before, after;
   if (!OpenDatabase(database, path, false, output)) return output.Finish();
@@ -309,7 +315,7 @@ int RunCompact(const TdbOptions& options, CommandContext& context) {
       return !key.deleted &&
              !(options.purge && !platform::FileExists(key.path) && PurgesMissing(key));
     });
-    output.Line(Tr("%1 -> %2 records", before.count, kept));
+    ReportCompaction(output, path, before.count, kept);
     return kExitOk;
   }
   CompactionProgress progress(output);
@@ -317,14 +323,14 @@ int RunCompact(const TdbOptions& options, CommandContext& context) {
       read ? database.CompactThumbnailDatabase(options.purge, &progress)
            : ThumbnailDatabase::Compacted::NotRead;
   if (result == ThumbnailDatabase::Compacted::Done && database.ReadDatabaseHeader(after)) {
-    output.Line(Tr("%1 -> %2 records", before.count, after.count));
+    ReportCompaction(output, path, before.count, after.count);
     return kExitOk;
   }
   const Status status = result == ThumbnailDatabase::Compacted::NotRead ? Status::FileReadError
                         : result == ThumbnailDatabase::Compacted::Stopped
                             ? Status::FunctionCancelled
                             : Status::ErrorWritingFile;
-  output.Failure(path, status, Tr("The database was left unchanged."));
+  output.FileFailed(path, status, Tr("The database was left unchanged."));
   return kExitFailed;
 }
 
@@ -351,6 +357,7 @@ void SetUpTdbAdd(CLI::App& app, CommandContext& context) {
   AddNumber(app, "-j,--jobs", options->jobs, "N", 0, 256,
             "Number of parallel jobs (default: 0, one per core)");
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be added");
+  AddFlag(app, "--json", options->json, "Print a JSON array of {file, status, message}");
 }
 
 void SetUpTdbFind(CLI::App& app, CommandContext& context) {
@@ -360,6 +367,8 @@ void SetUpTdbFind(CLI::App& app, CommandContext& context) {
   Require(AddName(app, "-o,--out", options->out, "FILE.THN", "Thumbnail file to write"));
   AddChoice(app, "--overwrite", options->overwrite, "HOW",
             "If the output exists: refuse (default) or replace", {"refuse", "replace"});
+  AddFlag(app, "--json", options->json,
+          "Print a JSON array of {file, destination, status, message}");
 }
 
 void SetUpTdbList(CLI::App& app, CommandContext& context) {
@@ -377,6 +386,7 @@ void SetUpTdbDelete(CLI::App& app, CommandContext& context) {
             "fotomill tdb delete Fotomill.tdb holiday/beach.jpg");
   context.names.Declare("DB PATH...", "The database, and paths of pictures", 2);
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be deleted");
+  AddFlag(app, "--json", options->json, "Print a JSON array of {file, status, message}");
 }
 
 void SetUpTdbCompact(CLI::App& app, CommandContext& context) {
@@ -386,6 +396,7 @@ void SetUpTdbCompact(CLI::App& app, CommandContext& context) {
   AddFlag(app, "--purge", options->purge,
           "Also remove thumbnails of missing pictures, except on network, optical and removable drives");
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only show how many records would remain");
+  AddFlag(app, "--json", options->json, "Print a JSON array of {database, before, after}");
 }
 
 }  // namespace fotomill::cli

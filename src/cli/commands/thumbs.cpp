@@ -178,21 +178,20 @@ int WriteDrawing(PictureRecord& picture, const std::string& name, const ThumbsOp
   if (status != Status::Ok) {
     const bool taken =
         write.existing == platform::Existing::Refuse && platform::FileExists(options.out);
-    output.Failure(
+    output.FileFailed(
         options.out, status,
         taken ? Tr("The file exists; use --overwrite replace to replace it.") : ReasonSentence());
     return output.Finish();
   }
-  output.CountFile();
-  output.Line(output.Shown(name) + " -> " + output.Shown(options.out));
+  output.FileDone(name, options.out);
   return output.Finish();
 }
 
 int RunShow(const ThumbsOptions& options, const CommandContext& context) {
   const std::string& name = context.names.values[0];
-  ResultOutput output(context, false);
+  ResultOutput output(context, options.json);
   const auto fail = [&](const std::string& file, Status status, std::string_view hint) {
-    output.Failure(file, status, hint);
+    output.FileFailed(file, status, hint);
     return output.Finish();
   };
   if (!platform::IsRegularFile(name)) return fail(name, Status::FileOpenError, {});
@@ -224,10 +223,10 @@ Status DrawPicture(const std::string& name, int32_t side, PicturePointer& pictur
 
 int RunDraw(const ThumbsOptions& options, const CommandContext& context) {
   const std::string& name = context.names.values[0];
-  ResultOutput output(context, false);
+  ResultOutput output(context, options.json);
   PicturePointer picture;
   if (const Status status = DrawPicture(name, options.side, picture); status != Status::Ok) {
-    output.Failure(name, status, OpenHint(name, status));
+    output.FileFailed(name, status, OpenHint(name, status));
     return output.Finish();
   }
   return WriteDrawing(*picture, name, options, output);
@@ -247,8 +246,8 @@ std::optional<std::vector<std::string>> PicturesIn(const std::string& folder) {
 }
 
 int FailFolder(ResultOutput& output, const std::string& folder) {
-  output.Failure(folder, Status::FileOpenError,
-                 platform::FileExists(folder) ? WithReason(Tr("Not a readable folder.")) : "");
+  output.FileFailed(folder, Status::FileOpenError,
+                    platform::FileExists(folder) ? WithReason(Tr("Not a readable folder.")) : "");
   return output.Finish();
 }
 
@@ -277,7 +276,7 @@ int RunList(const ThumbsOptions& options, const CommandContext& context) {
 
 int RunClean(const ThumbsOptions& options, const CommandContext& context) {
   const std::string& folder = context.names.values[0];
-  ResultOutput output(context, false);
+  ResultOutput output(context, options.json);
   const auto pictures = PicturesIn(folder);
   const auto orphans = pictures ? OrphanThumbnails(folder, *pictures) : std::nullopt;
   if (!orphans) return FailFolder(output, folder);
@@ -287,11 +286,11 @@ int RunClean(const ThumbsOptions& options, const CommandContext& context) {
     if (!options.dryRun && (optical || !platform::DeleteFile(orphan))) {
       // another run was faster
       if (platform::ExistenceOf(orphan) == platform::Existence::No) continue;
-      output.Failure(orphan, Status::ErrorWritingFile, WithReason(Tr("It could not be deleted.")));
+      output.FileFailed(orphan, Status::ErrorWritingFile,
+                        WithReason(Tr("It could not be deleted.")));
       continue;
     }
-    output.CountFile();
-    output.Line(output.Shown(orphan));
+    output.FileDone(orphan);
   }
   return output.Finish();
 }
@@ -332,6 +331,8 @@ void SetUpThumbsShow(CLI::App& app, CommandContext& context) {
                   "Picture to write; its extension selects the format"));
   AddChoice(app, "--overwrite", options->overwrite, "HOW",
             "If the output exists: refuse (default) or replace", {"refuse", "replace"});
+  AddFlag(app, "--json", options->json,
+          "Print a JSON array of {file, destination, status, message}");
 }
 
 void SetUpThumbsDraw(CLI::App& app, CommandContext& context) {
@@ -346,6 +347,8 @@ void SetUpThumbsDraw(CLI::App& app, CommandContext& context) {
   AddNumber(app, "--side", options->side, "N", 1, 4096, "Longest side in pixels (default: 256)");
   AddChoice(app, "--overwrite", options->overwrite, "HOW",
             "If the output exists: refuse (default) or replace", {"refuse", "replace"});
+  AddFlag(app, "--json", options->json,
+          "Print a JSON array of {file, destination, status, message}");
 }
 
 void SetUpThumbsList(CLI::App& app, CommandContext& context) {
@@ -364,6 +367,7 @@ void SetUpThumbsClean(CLI::App& app, CommandContext& context) {
       SetUp(app, context, RunClean, nullptr, "fotomill thumbs clean holiday --dry-run");
   context.names.Declare("DIR", "A folder of pictures", 1, 1);
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be deleted");
+  AddFlag(app, "--json", options->json, "Print a JSON array of {file, status, message}");
 }
 
 }  // namespace fotomill::cli

@@ -19,7 +19,6 @@ namespace {
 struct VerifyOptions {
   SelectionOptions selection;
   bool json = false;
-  bool verbose = false;
 };
 
 // Decodes every frame of an animation.
@@ -75,7 +74,7 @@ int RunVerify(const VerifyOptions& options, const CommandContext& context) {
     }
     output.CountFile();
     if (!output.IsJson()) output.Line(output.Shown(file.name) + ": " + StatusText(status));
-    if (options.verbose && !note.empty())
+    if (context.global.verbose && !note.empty())
       output.Note(output.Shown(file.name) + ": " + output.Shown(note));
   }
   return output.Finish();
@@ -87,7 +86,6 @@ void SetUpVerify(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<VerifyOptions>();
   AddSelection(app, options->selection, context);
   AddFlag(app, "--json", options->json, "Print a JSON array of {file, status, message}");
-  AddFlag(app, "-v,--verbose", options->verbose, "Report what is odd in files that are whole");
   SetFooter(app, "Decodes every page of every file; writes nothing.", "fotomill verify -r holiday");
   context.run = [options, &context] { return RunVerify(*options, context); };
 }

@@ -45,6 +45,7 @@ struct GlobalOptions {
   std::string dataFolder;             // empty: the default one
   std::vector<std::string> settings;  // KEY=VALUE, in order
   bool quiet = false;
+  bool verbose = false;  // more notes, and how long it took
   bool noInput = false;
   bool noPlugins = false;
   bool noHistory = false;

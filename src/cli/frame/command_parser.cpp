@@ -51,6 +51,8 @@ void AddGlobalOptions(CLI::App& app, GlobalOptions& global) {
   AddRepeatedText(app, "--set", global.settings, "KEY=VALUE",
                   "Set a configuration key for this run; may be repeated");
   AddFlag(app, "-q,--quiet", global.quiet, "No progress bar, notes or summary");
+  AddFlag(app, "-v,--verbose", global.verbose,
+          "More details: notes on files, and the time it took");
   AddFlag(app, "--no-input", global.noInput, "Never ask questions");
   AddFlag(app, "--no-plugins", global.noPlugins, "Do not load plug-ins");
   AddFlag(app, "--no-history", global.noHistory, "Do not record files in the file history");
@@ -100,6 +102,7 @@ CommandParser::CommandParser(const Command* command, CommandContext& context)
 }
 
 void CommandParser::ParseArguments(std::vector<std::string> arguments) {
+  RefuseFlagValues(arguments);
   SplitEmptyValues(arguments);
   std::reverse(arguments.begin(), arguments.end());
   try {
@@ -109,6 +112,19 @@ void CommandParser::ParseArguments(std::vector<std::string> arguments) {
     throw;
   }
   TakeNames();
+}
+
+// A flag is given or not: "--json=no" would be a riddle.
+void CommandParser::RefuseFlagValues(const std::vector<std::string>& arguments) const {
+  for (const std::string& argument : arguments) {
+    if (argument == "--") return;
+    const size_t equals = argument.find('=');
+    if (!argument.starts_with("--") || equals == std::string::npos) continue;
+    const std::string name = argument.substr(0, equals);
+    const CLI::Option* const option = get_option_no_throw(name);
+    if (option != nullptr && option->get_items_expected_max() == 0)
+      throw CLI::ExtrasError(Tr("%1 takes no value.", name), CLI::ExitCodes::ExtrasError);
+  }
 }
 
 // Throws the parser's own complaints in our words, and in the user's language; returns for all
@@ -143,7 +159,8 @@ void CommandParser::TakeNames() {
   for (auto& [kind, text] : missing_) {
     if (kind == CLI::detail::Classifier::POSITIONAL_MARK && !namesOnly) {
       namesOnly = true;
-    } else if (kind == CLI::detail::Classifier::NONE) {
+    } else if (kind == CLI::detail::Classifier::NONE &&
+               (namesOnly || text.size() < 2 || text[0] != '-')) {
       names.values.push_back(std::move(text));
     } else {
       RefuseOption(text);

@@ -21,6 +21,7 @@ class CommandParser : public CLI::App {
   std::string HelpPage() const;  // what --help prints, in the user's language
 
  private:
+  void RefuseFlagValues(const std::vector<std::string>& arguments) const;
   void Reword(const CLI::ParseError& error);
   void TakeNames();
   [[noreturn]] void RefuseOption(const std::string& typed) const;

@@ -19,7 +19,7 @@
 #include "cli/commands/thumbs.h"
 #include "cli/commands/turn.h"
 #include "cli/commands/verify.h"
-#include "cli/frame/completion.h"
+#include "cli/completion/completion.h"
 #include "cli/frame/manual.h"
 #include "texts/texts.h"
 
@@ -48,6 +48,7 @@ constexpr Command kCommands[] = {
     {"verify",  TrLater("decode files completely to find damaged ones"),                Needs::Formats,  SetUpVerify},
     {"config list",  TrLater("list the configuration keys and their values"),           Needs::Settings, SetUpConfigList},
     {"config get",   TrLater("print the values of keys"),                               Needs::Settings, SetUpConfigGet},
+    {"config describe", TrLater("explain keys: what they do, which values they take"), Needs::Settings, SetUpConfigDescribe},
     {"config set",   TrLater("set a key"),                                              Needs::Settings, SetUpConfigSet},
     {"config unset", TrLater("reset a key to its default"),                             Needs::Settings, SetUpConfigUnset},
     {"config path",  TrLater("print the path of the configuration file"),               Needs::Settings, SetUpConfigPath},

@@ -34,7 +34,15 @@ CLI::Option* AddChoice(CLI::App& app, const char* names, std::string& value, con
         return Tr("\"%1\" is not one of %2", text, list);
       },
       "");
-  return AddText(app, names, value, shownAs, help)->check(isWord);
+  std::string list;
+  for (const std::string& word : words) list += (list.empty() ? "" : "|") + word;
+  CLI::Option* const option = AddText(app, names, value, shownAs, help)->check(isWord);
+  option->type_name(list);  // what completion offers
+  const bool named = std::ranges::all_of(words, [&](const std::string& word) {
+    return std::string_view(help).find(word) != std::string_view::npos;
+  });
+  if (!named) option->description(option->get_description() + " (" + list + ")");
+  return option;
 }
 
 CLI::Option* AddNumber(CLI::App& app, const char* names, int32_t& value, const char* shownAs,
@@ -48,7 +56,11 @@ CLI::Option* AddNumber(CLI::App& app, const char* names, int32_t& value, const c
         return Tr("\"%1\" is not a whole number from %2 to %3", text, least, most);
       },
       "");
-  return app.add_option(names, value, Tr(help))->option_text(shownAs)->check(inRange);
+  std::string text = Tr(help);
+  const std::string highest = std::to_string(most);
+  if (most != INT32_MAX && std::string_view(help).find(highest) == std::string_view::npos)
+    text += " " + Tr("(%1 to %2)", least, most);
+  return app.add_option(names, value, text)->option_text(shownAs)->check(inRange);
 }
 
 CLI::Option* AddTexts(CLI::App& app, const char* names, std::vector<std::string>& values, int count,
@@ -64,7 +76,10 @@ CLI::Option* AddRepeatedText(CLI::App& app, const char* names, std::vector<std::
   return app.add_option(names, values, Tr(help))->option_text(shownAs)->allow_extra_args(false);
 }
 
-void Require(CLI::Option* option) { option->required(); }
+void Require(CLI::Option* option) {
+  option->required();
+  option->description(option->get_description() + " " + Tr("(required)"));
+}
 
 void Exclude(CLI::Option* option, CLI::Option* other) { option->excludes(other); }
 

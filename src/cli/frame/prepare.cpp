@@ -7,6 +7,7 @@
 #include "registry/registry.h"
 #include "settings/configuration.h"
 #include "settings/format_switches.h"
+#include "settings/key_help.h"
 #include "settings/plugin_settings.h"
 #include "texts/texts.h"
 
@@ -29,6 +30,15 @@ std::string PrepareFor(const Command& command, const GlobalOptions& global) {
     EnablePlugins();
   }
   return {};
+}
+
+std::vector<std::string> UnusedSettings(const GlobalOptions& global) {
+  std::vector<std::string> notes;
+  for (const std::string_view setting : global.settings) {
+    const KeyRow* const row = FindKey(setting.substr(0, setting.find('=')));
+    if (row != nullptr && !IsKeyUsed(*row)) notes.push_back(UnusedKeyText(*row));
+  }
+  return notes;
 }
 
 void FinishAfter(const Command& command) {

@@ -126,6 +126,27 @@ void ResultOutput::Failure(std::string_view name, Status status, std::string_vie
   Message(text);
 }
 
+void ResultOutput::FileDone(std::string_view file, std::string_view destination) {
+  CountFile();
+  if (!json_)
+    return Line(destination.empty() ? Shown(file) : Shown(file) + " -> " + Shown(destination));
+  Json element;
+  PutName(element, "file", file);
+  if (!destination.empty()) PutName(element, "destination", destination);
+  PutStatus(element, Status::Ok);
+  Element(element);
+}
+
+void ResultOutput::FileFailed(std::string_view file, Status status, std::string_view hint) {
+  if (json_) {
+    Json element;
+    PutName(element, "file", file);
+    PutStatus(element, status);
+    Element(element);
+  }
+  Failure(file, status, hint);
+}
+
 void ResultOutput::Note(std::string_view text) {
   if (!context_.global.quiet) Message(text);
 }
@@ -146,7 +167,9 @@ int ResultOutput::Finish() {
   const bool givenUp = !keepsGoing_ && std::ferror(context_.io.out) != 0 && ReaderGone();
   if (!context_.global.quiet && !givenUp) {
     if (failures_ > 0) Message(Tr(kErrorsLine));
-    Message(CountLine(static_cast<uint32_t>(files_)));
+    Message(failures_ == 0 ? CountLine(static_cast<uint32_t>(files_))
+                           : TrCount("One file was processed, %2 failed.",
+                                     "%1 files were processed, %2 failed.", files_, failures_));
   }
   return failures_ > 0 ? kExitFailed : kExitOk;
 }

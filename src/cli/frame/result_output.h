@@ -56,6 +56,11 @@ class ResultOutput {
   // Prints the message of a failed file, "NAME: MESSAGE", followed by the hint if any, and counts
   // it.
   void Failure(std::string_view name, Status status, std::string_view hint = {});
+  // A file that is done: a result line, "FILE" or "FILE -> DESTINATION", or an element {file,
+  // destination, status, message}; counted.
+  void FileDone(std::string_view file, std::string_view destination = {});
+  // A file that failed: as Failure, with an element of its own in JSON.
+  void FileFailed(std::string_view file, Status status, std::string_view hint = {});
   // A note on standard error, not a failure; suppressed by --quiet.
   void Note(std::string_view text);
   // A note to be printed once after the last result.
@@ -74,6 +79,7 @@ class ResultOutput {
   // False once standard output fails or the user has interrupted the program: loops over files end
   // then.
   bool GoesOn() const;
+  uint64_t Failures() const { return failures_; }  // files that failed
   bool Failed() const { return failures_ > 0; }  // a file failed, so the exit status is not 0
   // Ends the array, prints the closing lines ("There were errors", "3 files were processed.") and
   // returns the exit status.

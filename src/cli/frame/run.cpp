@@ -1,3 +1,5 @@
+#include <chrono>
+#include <cstdio>
 #include <cstdlib>
 #include <exception>
 #include <new>
@@ -105,8 +107,17 @@ int ParseAndRun(const Command* command, const Arguments& arguments, const Io& io
   const std::string problem = PrepareFor(*command, context.global);
   if (!problem.empty())
     return Complain(io, std::string(command->name) + ": " + problem, command->name);
+  for (const std::string& note : UnusedSettings(context.global))
+    if (!context.global.quiet) Print(io.err, "fotomill: --set: " + note + "\n");
+  const auto begun = std::chrono::steady_clock::now();
   const int status = context.run();
   FinishAfter(*command);
+  if (context.global.verbose && !context.global.quiet) {
+    const std::chrono::duration<double> taken = std::chrono::steady_clock::now() - begun;
+    char seconds[32];
+    std::snprintf(seconds, sizeof seconds, "%.2f", taken.count());
+    Print(io.err, Tr("It took %1 seconds.", seconds) + "\n");
+  }
   return status;
 }
 
@@ -175,8 +186,10 @@ int Dispatch(Arguments arguments, const Io& io) {
 
 bool CommandContext::ColorOn(bool terminal) const {
   if (global.color != "auto") return global.color == "always";
-  const char* noColor = std::getenv("NO_COLOR");
-  return terminal && (noColor == nullptr || *noColor == '\0');
+  const char* const noColor = std::getenv("NO_COLOR");
+  const char* const kind = std::getenv("TERM");
+  const bool dumb = kind != nullptr && std::string_view(kind) == "dumb";
+  return terminal && !dumb && (noColor == nullptr || *noColor == '\0');
 }
 
 int UsageError(const CommandContext& context, std::string_view message) {

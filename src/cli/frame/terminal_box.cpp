@@ -8,6 +8,9 @@ namespace fotomill::cli {
 void TerminalBox::ShowLine(const ProgressLine& line, const FileOutcome* outcome) {
   if (outcome == nullptr) {  // a closing line
     output_.EndArray();
+    if (output_.Failures() > 0 && !toldFailures_)
+      output_.Note(TrCount("One file failed.", "%1 files failed.", output_.Failures()));
+    toldFailures_ = true;
     return output_.Note(line.text);
   }
   const std::string name = output_.ShownMessage(outcome->source) + ": ";

@@ -28,6 +28,7 @@ class TerminalBox : public ProgressBox {
   void ShowElement(const FileOutcome& outcome);
 
   ResultOutput& output_;
+  bool toldFailures_ = false;
   const bool verbose_;
   const bool tellReplaced_;
 };

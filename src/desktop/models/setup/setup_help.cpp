@@ -1,5 +1,6 @@
 #include "desktop/models/setup/setup_help.h"
 
+#include "settings/key_help.h"
 #include "settings/setup_dialog.h"
 
 namespace fotomill::desktop {

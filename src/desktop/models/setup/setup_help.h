@@ -5,9 +5,8 @@
 
 namespace fotomill::desktop {
 
-// Pages of the documentation that the program carries with it, as docs/ has them.
-// docs/settings.md: an entry "### KEY" for each key that Setup shows
-extern const std::string_view kSettingsPage;
+// Pages of the documentation that the program carries with it, as docs/ has them; docs/settings.md
+// is in settings/key_help.h.
 extern const std::string_view kConfigurationPage;  // docs/configuration.md
 extern const std::string_view kDesktopPage;        // docs/desktop.md, the manual
 
