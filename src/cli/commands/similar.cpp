@@ -66,6 +66,7 @@ class Search {
       candidate.name = file.name;
       candidate.status = file.status;
       candidate.hint = file.hint;
+      if (candidate.status == Status::Ok) Recall(candidate);
     }
     output_.Expect(candidates_.size());
     ForEach([this](Candidate& candidate) { Look(candidate); });
@@ -113,16 +114,20 @@ class Search {
                     output_.ShownMessage(DataFile(kHashStoreName))));
   }
 
-  // Size and, unless only equal pixels count, hashes: from the store or the picture.
-  void Look(Candidate& candidate) {
+  // What the store knows. It belongs to the calling thread, so this is done before work begins.
+  void Recall(Candidate& candidate) const {
     const platform::FileFacts facts = platform::FactsOf(candidate.name);
     const HashRecord* const known =
         store_.Find(platform::AbsolutePath(candidate.name), facts.size, facts.modified);
     if (known != nullptr) candidate.record = *known;
     candidate.known = known != nullptr && (options_.exact || known->hasHashes);
-    if (candidate.known) return;
     candidate.record.size = facts.size;
     candidate.record.modified = facts.modified;
+  }
+
+  // Finds out size and, unless only equal pixels count, hashes.
+  void Look(Candidate& candidate) const {
+    if (candidate.known) return;
     PicturePointer picture;
     const ReadRequest request{
         .fileName = candidate.name, .thumbnailSide = kSideForHash, .options = read_};
@@ -152,7 +157,7 @@ class Search {
       lonely_.push_back(sizes[std::pair<int32_t, int32_t>(sizeOf(candidate))] < 2);
   }
 
-  void Digest(Candidate& candidate) {
+  void Digest(Candidate& candidate) const {
     const auto place = static_cast<size_t>(&candidate - candidates_.data());
     if (lonely_[place] || !candidate.record.digest.empty()) return;
     PicturePointer picture;
@@ -160,10 +165,12 @@ class Search {
     if (status == Status::Ok) status = TurnUpright(*picture);
     if (status == Status::Ok) status = DigestPixels(*picture, candidate.record.digest);
     if (status != Status::Ok) return Fail(candidate, status);
+    candidate.record.width = picture->width;  // upright
+    candidate.record.height = picture->height;
     candidate.known = false;  // there is something new to keep
   }
 
-  void Fail(Candidate& candidate, Status status) {
+  static void Fail(Candidate& candidate, Status status) {
     candidate.status = status;
     candidate.hint = OpenHint(candidate.name, status);
   }
