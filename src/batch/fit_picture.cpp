@@ -1,5 +1,7 @@
 #include "batch/fit_picture.h"
 
+#include <algorithm>
+
 #include "metadata/exif/picture_exif.h"
 #include "picture/gray_palette.h"
 #include "processing/color/color_profile.h"
@@ -11,15 +13,24 @@ namespace fotomill {
 
 namespace {
 
+// Whether the palette is the usual one of grays; files with another one may count as colored.
+bool IsRamp(const PictureRecord& picture) {
+  const Palette ramp = GrayLevels(picture.image.Bits());
+  return std::equal(ramp.begin(), ramp.begin() + 3 * picture.image.Colors(),
+                    picture.palette.begin());
+}
+
 bool IsGray(const PictureRecord& picture) {
   return HasOnlyGrays(picture.palette, picture.image.Colors());
 }
 
-// Gray pixels need a profile of grays, others one of RGB. Inks have no profile of their own any
-// more when they are RGB pixels here.
-bool SuitsPixels(const PictureRecord& picture) {
-  const ProfileColors wanted = IsGray(picture) ? ProfileColors::Gray : ProfileColors::Rgb;
-  return ColorsOfProfile(picture.metadata.icc) == wanted;
+// Gray pixels need a profile of grays, others one of RGB; gray ones with alpha may be stored as
+// RGB. Inks have no profile of their own any more when they are RGB pixels here.
+bool SuitsPixels(const PictureRecord& picture, const FormatEntry& row) {
+  const ProfileColors colors = ColorsOfProfile(picture.metadata.icc);
+  if (!IsGray(picture)) return colors == ProfileColors::Rgb;
+  return colors == ProfileColors::Gray && picture.alpha.Empty() &&
+         (row.keepsMetadata & kLostGrayIcc) != 0 && IsRamp(picture);
 }
 
 // Brings the colors from the picture's profile to another one; empty: sRGB.
@@ -65,7 +76,7 @@ Status FitPicture(PictureRecord& picture, const FormatEntry& row, const FitReque
     return GiveProfile(picture, row, *request.profile.profile, hint);
   if (picture.metadata.icc.empty()) return Status::Ok;
   const bool keep = request.profile.use == ProfileRequest::Use::Keep;
-  if (keep && HoldsProfile(row) && SuitsPixels(picture)) return Status::Ok;
+  if (keep && HoldsProfile(row) && SuitsPixels(picture, row)) return Status::Ok;
   ConvertColors(picture, {});
   picture.metadata.icc.clear();
   return Status::Ok;

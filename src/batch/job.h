@@ -123,6 +123,7 @@ struct FileOutcome {
   bool replaced = false;  // the output took the place of a file
   std::string output = {};  // which of several outputs of its source, by name
   RecordedText note = {};   // a remark that is not a failure; empty if there is none
+  RecordedText detail = {};  // what was done that the user need not know, as a sentence; or empty
 };
 
 }  // namespace fotomill

@@ -36,6 +36,8 @@ struct OutputTarget {
   std::string extension;
   bool kept = false;  // the source's own format, not one that was requested
   std::string path;   // empty until the picture is there, where the name needs it
+  bool sequence = false;        // all pictures of the source go into one file
+  int32_t page = 0, pages = 0;  // one of several numbered outputs, from 1; 0: the only one
 };
 
 // Formats for files whose outputs keep the format of their sources where it can be written.

@@ -1,8 +1,14 @@
 #include "batch/output_writer.h"
 
+#include <span>
+#include <utility>
+
+#include "batch/bare_output.h"
 #include "batch/fit_picture.h"
+#include "batch/left_out.h"
+#include "batch/page_source.h"
 #include "batch/picture_failure.h"
-#include "core/text.h"
+#include "core/byte_writer.h"
 #include "metadata/exif/picture_exif.h"
 #include "platform/files.h"
 #include "platform/output_file.h"
@@ -10,6 +16,7 @@
 #include "platform/reason.h"
 #include "platform/temporary_file.h"
 #include "platform/volumes.h"
+#include "processing/flatten.h"
 #include "processing/palette/reduce.h"
 #include "registry/registry.h"
 #include "texts/system_reason.h"
@@ -44,33 +51,84 @@ Status ChooseQuality(PictureRecord& picture, const OutputTarget& target, WriteOp
   return status;
 }
 
+Status WriteWhole(std::span<const uint8_t> bytes, const std::string& path,
+                  const WriteOptions& options) {
+  ByteWriter out;
+  if (!out.Create(path)) return Status::ErrorCreatingFile;
+  out.Bytes(bytes);
+  return CommitOutput(out, options);
+}
+
 }  // namespace
 
-Status OutputWriter::Prepare(PictureRecord& picture, const OutputTarget& target,
-                             std::string& hint) const {
+Status OutputWriter::Prepare(PreparedOutput& output, std::string& hint) const {
+  PictureRecord& picture = output.picture;
+  const OutputTarget& target = output.target;
+  if (OnlyDropsMetadata(picture, target)) {
+    BareOutput bare = MakeBareOutput(picture, job_.turnsUpright);
+    output.file = std::move(bare.file);
+    output.asSource = bare.asSource;
+    output.note = std::move(bare.note);
+    output.allPages = !output.file.empty();
+    if (!output.file.empty()) {
+      output.detail = TrRecorded("Copied without encoding.");
+      return Status::Ok;
+    }
+  }
   if (target.output->transform) RETURN_IF_BAD(target.output->transform(picture));
-  const FitRequest fit{.keepsMetadata = function_.keepMetadata && job_.encode.preserveMetadata,
+  const FormatEntry& row = FormatRow(target.formatIndex);
+  const FitRequest fit{.keepsMetadata = KeepsMetadata(),
                        .turnsUpright = job_.turnsUpright,
                        .profile = function_.profile};
-  RETURN_IF_BAD(FitPicture(picture, FormatRow(target.formatIndex), fit, hint));
+  const bool upright = OrientationOf(picture) == Orientation::Upright;
+  const bool profile = !picture.metadata.icc.empty();
+  RETURN_IF_BAD(FitPicture(picture, row, fit, hint));
+  if (!upright && OrientationOf(picture) == Orientation::Upright)
+    output.detail.Append(TrRecorded("Turned upright."));
+  if (profile && picture.metadata.icc.empty())
+    output.detail.Append(TrRecorded("Colors converted to sRGB."));
+  // frames keep what is transparent where a single picture is flattened
+  const uint32_t keeps = target.sequence ? FMT_ALPHA | FMT_TRANSPARENT : FMT_ALPHA;
+  output.transparency =
+      (row.flags & keeps) == 0 && !picture.alpha.Empty() && !IsOpaque(picture.alpha);
+  output.allPages = target.sequence;
+  if (target.sequence) return Status::Ok;  // each page is made ready when it is written
   RETURN_IF_BAD(Plan(picture, target, hint));
-  const auto deepest = static_cast<int32_t>(FormatRow(target.formatIndex).maxBits);
+  const auto deepest = static_cast<int32_t>(row.maxBits);
   return picture.bitsPerPixel <= deepest ? Status::Ok
                                          : ReduceColors(picture, deepest, job_.reduction);
+}
+
+// Whether all that is asked for is a file without metadata in the format of the source.
+bool OutputWriter::OnlyDropsMetadata(const PictureRecord& picture,
+                                     const OutputTarget& target) const {
+  if (function_.keepMetadata || function_.transform || target.output->transform) return false;
+  if (function_.encodesAnew || target.output->quality > 0 || target.output->mostBytes > 0)
+    return false;
+  if (function_.page > 0 && picture.pageCount > 1) return false;
+  if (picture.shortfall != Status::Ok || target.page > 0) return false;
+  const bool converts =
+      function_.profile.use == ProfileRequest::Use::Given ||
+      (function_.profile.use == ProfileRequest::Use::Srgb && !picture.metadata.icc.empty());
+  if (converts || picture.formatIndex == kNoFormat) return false;
+  // the rows of one codec share its settings
+  const FormatEntry &from = FormatRow(picture.formatIndex), &to = FormatRow(target.formatIndex);
+  return from.bare != nullptr && from.settings == to.settings;
 }
 
 Status OutputWriter::Plan(const PictureRecord& picture, const OutputTarget& target,
                           std::string& hint) const {
   const auto deepest = static_cast<int32_t>(FormatRow(target.formatIndex).maxBits);
-  if (picture.bitsPerPixel <= deepest || Reduces(target)) return Status::Ok;
+  if (picture.bitsPerPixel <= deepest || Reduces(target) || target.sequence) return Status::Ok;
   hint = function_.reduceHint;
   return Status::TooManyColors;
 }
 
-Status OutputWriter::Write(PictureRecord& picture, const Destination& destination,
-                           const OutputTarget& target, std::string& hint) const {
-  const Status status = WriteFile(picture, destination, target, hint);
-  if (status != Status::Ok && hint.empty()) hint = Hint(destination, status, picture, target);
+Status OutputWriter::Write(const PreparedOutput& output, const Destination& destination,
+                           std::string& hint) const {
+  const Status status = WriteFile(output, destination, hint);
+  if (status != Status::Ok && hint.empty())
+    hint = Hint(destination, status, output.picture, output.target);
   return status;
 }
 
@@ -80,32 +138,43 @@ bool OutputWriter::MakesFolder(const Destination& destination, const OutputTarge
   return !beside && function_.out.empty() && !destination.elsewhere;
 }
 
-Status OutputWriter::PlanFile(const PictureRecord& picture, const Destination& destination,
-                              const OutputTarget& target, std::string& hint) const {
+Status OutputWriter::PlanFile(const PreparedOutput& output, const Destination& destination,
+                              std::string& hint) const {
   const std::string folder = platform::FolderOf(destination.path);
   const bool there =
-      MakesFolder(destination, target) || folder.empty() || platform::IsFolder(folder);
+      MakesFolder(destination, output.target) || folder.empty() || platform::IsFolder(folder);
   if (there && platform::MayCreate(destination.path)) return Status::Ok;
-  hint = Hint(destination, Status::ErrorCreatingFile, picture, target);
+  hint = Hint(destination, Status::ErrorCreatingFile, output.picture, output.target);
   return Status::ErrorCreatingFile;
 }
 
-Status OutputWriter::WriteFile(PictureRecord& picture, const Destination& destination,
-                               const OutputTarget& target, std::string& hint) const {
-  if (MakesFolder(destination, target) &&
-      !platform::MakeFolders(platform::FolderOf(destination.path)))
-    return Status::ErrorCreatingFile;
+WriteOptions OutputWriter::OptionsFor(const PreparedOutput& output,
+                                      const Destination& destination) const {
   WriteOptions write{.encode = job_.encode};
   write.existing = destination.replace ? platform::Existing::Replace : platform::Existing::Refuse;
   write.keepMetadata = function_.keepMetadata;
   write.comment = job_.writeComments;
   write.password = destination.password;
-  if (target.output->quality > 0) write.encode.SetQuality(target.output->quality);
+  if (output.asSource) write.encode.jpegAsSource = true;
+  const int32_t quality = output.target.output->quality;
+  if (quality > 0) write.encode.SetQuality(quality);
   if (destination.recycle) {
-    write.makeWay = [&] {
-      return !platform::FileExists(destination.path) || platform::MoveToTrash(destination.path);
-    };
+    const std::string path = destination.path;
+    write.makeWay = [path] { return !platform::FileExists(path) || platform::MoveToTrash(path); };
   }
+  return write;
+}
+
+Status OutputWriter::WriteFile(const PreparedOutput& output, const Destination& destination,
+                               std::string& hint) const {
+  PictureRecord& picture = output.picture;
+  const OutputTarget& target = output.target;
+  if (MakesFolder(destination, target) &&
+      !platform::MakeFolders(platform::FolderOf(destination.path)))
+    return Status::ErrorCreatingFile;
+  WriteOptions write = OptionsFor(output, destination);
+  if (!output.file.empty()) return WriteWhole(output.file, destination.path, write);
+  if (target.sequence) return WriteSequence(output, destination, write, hint);
   const PathText source = picture.fileName;
   RefreshExif(picture);
   if (target.output->mostBytes > 0) RETURN_IF_BAD(ChooseQuality(picture, target, write, hint));
@@ -120,15 +189,76 @@ Status OutputWriter::WriteFile(PictureRecord& picture, const Destination& destin
   return status;
 }
 
-RecordedText OutputWriter::Note(const PictureRecord& picture,
-                                const Destination& destination) const {
-  const PictureMetadata& metadata = picture.metadata;
-  std::string lost;
-  if (!metadata.exif.empty() && (picture.lostMetadata & kLostExif) != 0) lost += ", EXIF";
-  if (!metadata.xmp.empty() && (picture.lostMetadata & kLostXmp) != 0) lost += ", XMP";
-  if (!metadata.icc.empty() && (picture.lostMetadata & kLostIcc) != 0) lost += ", color profile";
-  if (!function_.keepMetadata || lost.empty()) return {};
-  return TrRecorded("%1 cannot store: %2.", UpperCase(destination.extension), lost.substr(2));
+// What Prepare does to a single picture.
+Status OutputWriter::FitPage(PictureRecord& picture, const OutputTarget& target,
+                             std::string& hint) const {
+  if (function_.autoOrient) RETURN_IF_BAD(TurnUpright(picture));
+  if (function_.transform) RETURN_IF_BAD(function_.transform(picture));
+  if (target.output->transform) RETURN_IF_BAD(target.output->transform(picture));
+  const FormatEntry& row = FormatRow(target.formatIndex);
+  const FitRequest fit{.keepsMetadata = KeepsMetadata(),
+                       .turnsUpright = job_.turnsUpright,
+                       .profile = function_.profile};
+  RETURN_IF_BAD(FitPicture(picture, row, fit, hint));
+  if ((row.flags & (FMT_ALPHA | FMT_TRANSPARENT)) == 0) RETURN_IF_BAD(FlattenAlpha(picture));
+  RefreshExif(picture);
+  const bool allowed = row.limits.Allow(picture.image.Width(), picture.image.Height());
+  if (!allowed) hint = SizeHint(picture, row);
+  return allowed ? Status::Ok : Status::UnsuitableImage;
+}
+
+Status OutputWriter::AddPage(SequenceWriter& sequence, PictureRecord& picture, int32_t delayMs,
+                             const OutputTarget& target, std::string& hint) const {
+  Status status = sequence.Add(picture, delayMs);
+  if (status == Status::TooManyColors && Reduces(target)) {
+    // one entry is left for transparency
+    const PaletteChoice choice{.colors = 255};
+    RETURN_IF_BAD(ReduceToPalette(picture, choice, job_.reduction, {}));
+    status = sequence.Add(picture, delayMs);
+  }
+  if (status == Status::TooManyColors) hint = function_.reduceHint;
+  if (status == Status::UnsuitableImage && hint.empty())
+    hint = Tr("The frames have different sizes; choose one with --page.");
+  return status;
+}
+
+Status OutputWriter::WriteSequence(const PreparedOutput& output, const Destination& destination,
+                                   const WriteOptions& options, std::string& hint) const {
+  const FormatEntry& row = FormatRow(output.target.formatIndex);
+  PageSource source;
+  RETURN_IF_BAD(source.Open({.fileName = std::string(output.picture.fileName.view()),
+                             .stop = job_.stop.Token(),
+                             .options = job_.read}));
+  SequencePointer sequence;
+  const SequenceFacts facts{
+      .count = source.Count(), .animated = source.Animated(), .rounds = source.Rounds()};
+  RETURN_IF_BAD(row.sequence(destination.path, facts, options, sequence));
+  PicturePointer page;
+  int32_t delayMs = 0;
+  for (size_t i = 0; i < source.Count(); ++i) {
+    RETURN_IF_BAD(source.Next(page, delayMs));
+    RETURN_IF_BAD(FitPage(*page, output.target, hint));
+    RETURN_IF_BAD(AddPage(*sequence, *page, delayMs, output.target, hint));
+    if (job_.stop.Token().Asked()) return Status::FunctionCancelled;
+  }
+  output.picture.lostMetadata = static_cast<uint8_t>(kAllMetadata & ~row.keepsMetadata);
+  return sequence->Finish();
+}
+
+RecordedText OutputWriter::Note(const PreparedOutput& output) const {
+  const PictureRecord& picture = output.picture;
+  RecordedText note = output.note;
+  if (picture.shortfall != Status::Ok)
+    note.Append(TrRecorded("The file is incomplete; what is missing is blank."));
+  if (!output.file.empty()) return note;
+  const bool frames =
+      picture.formatIndex != kNoFormat && FormatRow(picture.formatIndex).animate != nullptr;
+  const bool chosen = function_.page > 0 || output.allPages;
+  note.Append(LeftOut(picture, {.metadataWanted = KeepsMetadata(),
+                                .pages = chosen ? 0 : picture.pageCount - 1,
+                                .frames = frames,
+                                .transparency = output.transparency}));
+  return note;
 }
 
 std::string OutputWriter::Hint(const Destination& destination, Status status,

@@ -42,6 +42,16 @@ bool AsksEveryName(const BatchJob& job) {
          (job.naming.askName || (job.naming.askPassword && row.takesPassword));
 }
 
+// The name of a page's file: "scan-03.png" of "scan.png". All have as many digits.
+std::string NumberedPage(const std::string& path, int32_t page, int32_t pages) {
+  const std::string digits = std::to_string(page);
+  const size_t width = std::to_string(pages).size();
+  const std::string_view extension = platform::ExtensionOf(path);
+  const size_t end = path.size() - (extension.empty() ? 0 : extension.size() + 1);
+  return path.substr(0, end) + "-" + std::string(width - digits.size(), '0') + digits +
+         path.substr(end);
+}
+
 FileOutcome Failure(const BatchFile& file, Status status, std::string hint = {}) {
   return {.source = file.name, .status = status, .hint = std::move(hint)};
 }
@@ -135,7 +145,8 @@ class Batch {
         targets, [&](const OutputTarget& target) { return target.path == file.name; });
     if (inPlace && !function_.dryRun && !held.Hold(file.name)) return {NotHeld(file)};
     PicturePointer picture;
-    if (const Status status = Load(file.name, picture); status != Status::Ok) {
+    if (const Status status = Load(file.name, std::max(function_.page, 1), picture);
+        status != Status::Ok) {
       return {Failure(file, status, LoadHint(file.name, status, picture.get()))};
     }
     if (function_.transform && !IsOnlyPlanned()) {
@@ -143,11 +154,18 @@ class Batch {
         return {Failure(file, status)};
     }
     for (const size_t k : open) {
+      ChoosePages(*picture, targets[k]);
+      if (targets[k].pages > 0) {
+        if (!ProduceNumbered(i, targets[k], held, outcomes)) return {};
+        continue;
+      }
       auto outcome = Produce(i, targets[k], picture, k == open.back(), held);
       if (!outcome) return {};
       outcomes[k] = std::move(*outcome);
       outcomes[k].output = targets[k].output->label;
     }
+    // numbered outputs have added outcomes of their own
+    std::erase_if(outcomes, [](const FileOutcome& outcome) { return outcome.source.empty(); });
     return outcomes;
   }
 
@@ -172,6 +190,38 @@ class Batch {
     return true;
   }
 
+  // Whether an output gets more than one picture, and how.
+  void ChoosePages(const PictureRecord& picture, OutputTarget& target) const {
+    if (picture.pageCount < 2 || function_.page > 0 || picture.formatIndex == kNoFormat) return;
+    const FormatEntry &from = FormatRow(picture.formatIndex), &to = FormatRow(target.formatIndex);
+    const bool animation = from.animate != nullptr && (to.flags & FMT_FRAMES) != 0;
+    const bool all = function_.page == kAllPages;
+    // PNG holds frames, not pages
+    const bool holds = to.sequence != nullptr && target.output->mostBytes == 0 &&
+                       (animation || (all && (to.flags & FMT_PNG) == 0));
+    target.sequence = holds;
+    target.pages = all && !holds ? picture.pageCount : 0;
+  }
+
+  // Every page into a file of its own. False if the run ended.
+  bool ProduceNumbered(size_t i, OutputTarget target, platform::HeldFile& held,
+                       std::vector<FileOutcome>& outcomes) {
+    const BatchFile& file = files_[i];
+    for (target.page = 1; target.page <= target.pages; ++target.page) {
+      PicturePointer picture;
+      Status status = Load(file.name, target.page, picture);
+      if (status == Status::Ok && function_.transform && !IsOnlyPlanned())
+        status = function_.transform(*picture);
+      auto outcome = status == Status::Ok
+                         ? Produce(i, target, picture, true, held)
+                         : Failure(file, status, LoadHint(file.name, status, picture.get()));
+      if (!outcome) return false;
+      outcome->output = target.output->label;
+      outcomes.push_back(std::move(*outcome));
+    }
+    return true;
+  }
+
   // Makes one output of a picture that has gone through the function's own work. All but the last
   // one get a copy.
   std::optional<FileOutcome> Produce(size_t i, const OutputTarget& target, PicturePointer& picture,
@@ -188,15 +238,18 @@ class Batch {
     // The source may have bound its own plug-in format to the row that the destination's had.
     if (target.formatIndex == kSpareRow) (void)FindPluginFormat("x." + target.extension);
     std::string hint;
-    const Status prepared =
-        IsOnlyPlanned() ? writer_.Plan(own, target, hint) : writer_.Prepare(own, target, hint);
-    if (prepared != Status::Ok) return Failure(file, prepared, std::move(hint));
+    PreparedOutput output{.picture = own, .target = target};
+    const Status status =
+        IsOnlyPlanned() ? writer_.Plan(own, target, hint) : writer_.Prepare(output, hint);
+    if (status != Status::Ok) return Failure(file, status, std::move(hint));
     Destination destination;
     destination.path = target.output->nameNeedsPicture ? PathOf(file, target, &own) : target.path;
     destination.formatIndex = target.formatIndex;
     destination.extension = target.extension;
     if (destination.path.empty()) return Failure(file, Status::InvalidDestination, kNoName);
-    return WriteUnderFreeName(i, std::move(destination), own, target, held);
+    if (target.page > 0)
+      destination.path = NumberedPage(destination.path, target.page, target.pages);
+    return WriteUnderFreeName(i, std::move(destination), output, held);
   }
 
   static FileOutcome NotHeld(const BatchFile& file) {
@@ -225,18 +278,22 @@ class Batch {
     return destination.taken;
   }
 
-  Status Load(const std::string& name, PicturePointer& picture) const {
-    ReadRequest request{.fileName = name, .stop = job_.stop.Token(), .options = job_.read};
+  Status Load(const std::string& name, int32_t page, PicturePointer& picture) const {
+    ReadRequest request{.fileName = name,
+                        .partial = function_.salvage,
+                        .stop = job_.stop.Token(),
+                        .options = job_.read};
     RETURN_IF_BAD(LoadPictureInfo(request, picture));
-    request.page = picture->page = function_.page - 1;
-    if (IsOnlyPlanned()) return function_.page > picture->pageCount ? Status::NoImages : Status::Ok;
+    request.page = picture->page = page - 1;
+    if (IsOnlyPlanned()) return page > picture->pageCount ? Status::NoImages : Status::Ok;
     RETURN_IF_BAD(ReadPicture(request, *picture));
     return function_.autoOrient ? TurnUpright(*picture) : Status::Ok;
   }
 
   std::string LoadHint(const std::string& name, Status status, const PictureRecord* picture) const {
     if (picture == nullptr || status != Status::NoImages || function_.page <= picture->pageCount) {
-      return OpenHint(name, status);
+      const std::string hint = OpenHint(name, status);
+      return hint.empty() && status == Status::FileReadError ? function_.salvageHint : hint;
     }
     return TrCount("The file has only one page.", "The file has only %1 pages.",
                    static_cast<uint64_t>(picture->pageCount));
@@ -245,22 +302,21 @@ class Batch {
   // Settles the name and writes, again when someone else has taken the name since it was found
   // free.
   std::optional<FileOutcome> WriteUnderFreeName(size_t i, const Destination& planned,
-                                                PictureRecord& picture, const OutputTarget& target,
+                                                const PreparedOutput& output,
                                                 platform::HeldFile& source) {
     std::optional<FileOutcome> outcome;
     const bool settled =
-        RetryLostRaces([&] { return TryToWrite(i, planned, picture, target, source, outcome); });
+        RetryLostRaces([&] { return TryToWrite(i, planned, output, source, outcome); });
     return settled ? outcome : Failure(files_[i], Status::ErrorCreatingFile, Tr(kWriteAborted));
   }
 
   // One attempt at that. False when the name was lost; otherwise `outcome` is what came of the
   // file, none if it was given up.
-  bool TryToWrite(size_t i, Destination destination, PictureRecord& picture,
-                  const OutputTarget& target, platform::HeldFile& source,
-                  std::optional<FileOutcome>& outcome) {
+  bool TryToWrite(size_t i, Destination destination, const PreparedOutput& output,
+                  platform::HeldFile& source, std::optional<FileOutcome>& outcome) {
     const BatchFile& file = files_[i];
     bool cancelled = false;
-    if (Settle(i, destination, picture, cancelled) == DestinationAnswer::Skip) {
+    if (Settle(i, destination, output, cancelled) == DestinationAnswer::Skip) {
       cancelled = cancelled || destination.search == VariantSearch::Stopped;
       if (!cancelled) outcome = Skipped(file, destination);
       return true;
@@ -278,11 +334,10 @@ class Batch {
       return true;
     }
     std::string hint;
-    const Status status =
-        function_.dryRun ? writer_.PlanFile(picture, destination, target, hint)
-                         : writer_.Write(picture, destination, target, hint);
+    const Status status = function_.dryRun ? writer_.PlanFile(output, destination, hint)
+                                           : writer_.Write(output, destination, hint);
     if (status == Status::Ok) {
-      outcome = Written(file, destination, replaces, picture);
+      outcome = Written(file, destination, replaces, output);
       return true;
     }
     GiveBack(destination.path);
@@ -304,12 +359,14 @@ class Batch {
     names_.Release(path);
   }
 
-  DestinationAnswer Settle(size_t i, Destination& destination, const PictureRecord& picture,
+  DestinationAnswer Settle(size_t i, Destination& destination, const PreparedOutput& output,
                            bool& cancelled) {
     DestinationAnswer answer = DestinationAnswer::Skip;
-    if (SettleAtOnce(files_[i].name, destination, answer)) return answer;
+    // nobody has planned for numbered names
+    const bool planned = output.target.page == 0;
+    if (planned && SettleAtOnce(files_[i].name, destination, answer)) return answer;
     const bool done = run_.InTurn(
-        i, [&] { answer = SettleInTurn(files_[i].name, destination, picture, cancelled); });
+        i, [&] { answer = SettleInTurn(files_[i].name, destination, output.picture, cancelled); });
     cancelled = cancelled || !done;
     return answer;
   }
@@ -392,7 +449,7 @@ class Batch {
   }
 
   FileOutcome Written(const BatchFile& file, const Destination& destination, bool replaces,
-                      const PictureRecord& picture) const {
+                      const PreparedOutput& output) const {
     if (function_.keepTimes && !function_.dryRun &&
         !platform::CopyTimes(file.name, destination.path)) {
       FileOutcome outcome = Failure(file, Status::ErrorWritingFile,
@@ -401,7 +458,8 @@ class Batch {
       return outcome;
     }
     FileOutcome outcome{.source = file.name, .destination = destination.path, .replaced = replaces};
-    outcome.note = writer_.Note(picture, destination);
+    outcome.note = writer_.Note(output);
+    outcome.detail = output.detail;
     if (!function_.dryRun) NoteLostAttributes(outcome);
     return outcome;
   }

@@ -23,6 +23,10 @@ struct BatchFile {
   std::string hint;            // what goes behind the message of such a failure
 };
 
+// Every page goes into an output: into one file where the format holds several, else into files
+// with numbered names.
+inline constexpr int32_t kAllPages = -1;
+
 // What a function does to every file of its selection.
 struct BatchFunction {
   // Changes the decoded picture; empty for plain conversion. Called on several threads at once,
@@ -38,14 +42,21 @@ struct BatchFunction {
            // but nothing in front of names that an output makes itself
   // not empty: the whole path of the output of a selection of one
   std::string out = {};
-  int32_t page = 1;                              // of files with several, from 1
+  // of files with several, from 1, or kAllPages; 0: all frames where an animation becomes one, else
+  // the first page
+  int32_t page = 0;
   uint32_t jobs = 0;                             // number of parallel jobs; 0: one per core
   bool reduce = false;  // colors of pictures that are too deep for the format are reduced, as
                         // they always are for a format that was kept
   std::string reduceHint = {};                   // follows "Too many colors."
+  // what can be read of files that end early is converted, with a note
+  bool salvage = false;
+  std::string salvageHint = {};                  // follows "File read error." without that
   bool autoOrient = false;                       // pictures are rotated upright by EXIF orientation
   bool keepMetadata = true;                      // EXIF, XMP and comments are copied
   ProfileRequest profile = {};                   // color profiles
+  // files that only lose their metadata are encoded all the same, with a quality that was asked for
+  bool encodesAnew = false;
   // outputs get the modification times of their sources
   bool keepTimes = false;
   // the folders of the selection are recreated in the destination folder

@@ -5,12 +5,14 @@
 #include <span>
 #include <string>
 #include <string_view>
+#include <vector>
 
 #include "core/fixed_text.h"
 #include "core/status.h"
 #include "picture/animation.h"
 #include "picture/picture_record.h"
 #include "picture/read_request.h"
+#include "picture/sequence.h"
 #include "picture/write_options.h"
 #include "texts/texts.h"
 
@@ -60,6 +62,13 @@ using ReadOperation = Status (*)(PictureRecord& picture, const ReadRequest& requ
 using WriteOperation = Status (*)(PictureRecord& picture, const WriteOptions& options);
 // opens a file's frames
 using AnimateOperation = Status (*)(const ReadRequest& request, AnimationPointer& animation);
+// Makes a copy of a file without EXIF, XMP, IPTC, comments and what else tells more than the
+// picture shows; all pages, compressed pixels and the color profile stay as they are. DamagedFile
+// (2), FileReadError (3) or UnsupportedFormat (8) for a file that is not laid out as expected.
+using BareOperation = Status (*)(std::span<const uint8_t> file, std::vector<uint8_t>& bare);
+// Begins a file that takes several pictures, one after the other.
+using SequenceOperation = Status (*)(const std::string& path, const SequenceFacts& facts,
+                                     const WriteOptions& options, SequencePointer& sequence);
 using LifeOperation = int32_t (*)();  // once for each run of the program
 // Modal over the parent window.
 using OptionsOperation = int32_t (*)(void* parentWindow, int32_t parameter);
@@ -109,7 +118,8 @@ struct FormatLibrary {
 };
 
 // Everything that `keepsMetadata` can say; the bits are those of PictureRecord::lostMetadata.
-inline constexpr uint8_t kAllMetadata = kLostExif | kLostXmp | kLostIcc;
+inline constexpr uint8_t kAllMetadata =
+    kLostExif | kLostXmp | kLostIcc | kLostComment | kLostMakerNote | kLostGrayIcc;
 
 // What a row says when its files can be read but not written.
 inline constexpr std::string_view kOnlyRead = TrLater("Files of this format can only be read.");
@@ -138,7 +148,6 @@ struct FormatEntry {
   bool canRead = false;          // `info` and `read` do their work in this build
   bool canWrite = false;         // so does `write`
   bool canStartUp = false;       // so does `startup`
-  bool writesPages = false;      // `write` can put several pictures into one file
   // What `info` and `read` leave to a child process; null: they work in this one.
   const platform::ApartTask* childTask = nullptr;
   // whether what the codec loads when it is needed is on this machine; null: nothing is
@@ -147,6 +156,9 @@ struct FormatEntry {
   std::span<const Signature> signatures = {};
   // kLost bits: what its files can hold, and so does not get lost
   uint8_t keepsMetadata = 0;
+  BareOperation bare = nullptr;
+  bool bareKeepsOrientation = false;  // it is a part of the picture's own directory
+  SequenceOperation sequence = nullptr;
   bool turnsWithoutLoss = false;             // JPEG files, which are turned without being decoded
   // `write` protects files by the password of its options
   bool takesPassword = false;

@@ -94,6 +94,9 @@ Status CopyPicture(const PictureRecord& picture, PictureRecord& copy) {
   copy.metadata = picture.metadata;
   copy.comment = picture.comment;
   copy.warning = picture.warning;
+  copy.unread = picture.unread;
+  copy.shortfall = picture.shortfall;
+  copy.jpegCoding = picture.jpegCoding;
   copy.pageCount = picture.pageCount;
   copy.page = picture.page;
   copy.hotSpotX = picture.hotSpotX;

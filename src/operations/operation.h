@@ -76,6 +76,9 @@ struct ArgumentProblem {
 // Called once each argument is right.
 using CheckFunction = ArgumentProblem (*)(const Arguments& arguments);
 
+// Whether an operation with these arguments moves or cuts off pixels and gives none another color.
+using MovesFunction = bool (*)(const Arguments& arguments);
+
 // One operation: a constant row.
 struct Operation {
   const char* name;     // lower case, words joined by hyphens
@@ -89,6 +92,7 @@ struct Operation {
   PointFunction point = nullptr;  // point operations
   ReachFunction reach = nullptr;  // neighborhood operations
   CheckFunction check = nullptr;  // may be missing
+  MovesFunction moves = nullptr;  // missing: it never does
 };
 
 }  // namespace fotomill

@@ -275,6 +275,16 @@ const Operation* Recipe::First() const {
   return nullptr;
 }
 
+bool Recipe::OnlyMovesPixels() const {
+  const auto moves = [](const Step& step) {
+    return step.operation->moves != nullptr && step.operation->moves(step.arguments);
+  };
+  return HasSteps() && std::ranges::all_of(common, moves) &&
+         std::ranges::all_of(outputs, [&](const RecipeOutput& output) {
+           return std::ranges::all_of(output.steps, moves);
+         });
+}
+
 std::string Mistake::Text(bool withLine) const {
   std::string text;
   if (withLine) text.append("Line ").append(std::to_string(line)).append(": ");

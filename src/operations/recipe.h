@@ -56,6 +56,8 @@ struct Recipe {
   // The first operation that is applied; null when the recipe only saves.
   const Operation* First() const;
   bool HasSteps() const { return First() != nullptr; }  // an output has at least one
+  // It has steps, and all of them only move or cut off pixels.
+  bool OnlyMovesPixels() const;
 };
 
 // What is wrong in a recipe, and where.

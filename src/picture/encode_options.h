@@ -29,6 +29,9 @@ struct EncodeOptions {
   bool iffPacked = false;                            // CreateIffPBM
   int32_t jpegQuality = 75;                         // JpegCompression, 1 to 100
   int32_t jpegSubsampling = choice::kSubsample420;  // JpegSubsample
+  // pictures from JPEG files keep their quantization and chroma sampling, whatever the two above
+  // say
+  bool jpegAsSource = false;
   bool jpegProgressive = false;                     // WriteJpegProgressive
   bool jpegStoresResolution = false;                // JpegStoreDPI
   bool macBinary = false;                           // CreateMacbinaryHeader
@@ -46,7 +49,7 @@ struct EncodeOptions {
   // A quality of 1 to 100 for all formats that compress with loss, which they then do.
   void SetQuality(int32_t quality) {
     jpegQuality = webpQuality = quality;
-    webpLossless = webpMixed = false;
+    webpLossless = webpMixed = jpegAsSource = false;
   }
 };
 

@@ -24,8 +24,20 @@ inline constexpr int32_t kNoFormat = -1;
 inline constexpr uint8_t kHasAlpha = 1;
 inline constexpr uint8_t kFlattenOnBackground = 2;  // flatten onto the record's own background
 
-// Bits of PictureRecord::lostMetadata.
-inline constexpr uint8_t kLostExif = 1, kLostXmp = 2, kLostIcc = 4;
+// Bits of PictureRecord::lostMetadata. A maker note is lost where EXIF is laid out anew: what it
+// points to in its own way is not found any more.
+inline constexpr uint8_t kLostExif = 1, kLostXmp = 2, kLostIcc = 4, kLostComment = 8,
+                         kLostMakerNote = 16, kLostGrayIcc = 32;  // a profile of grays
+
+// Bits of PictureRecord::unread: what the file holds and no record can.
+inline constexpr uint8_t kUnreadDepth = 1;  // samples of more than 8 bits
+inline constexpr uint8_t kUnreadInks = 2;   // other colors than red, green, blue; further channels
+inline constexpr uint8_t kUnreadIptc = 4;   // captions and keywords of news agencies
+inline constexpr uint8_t kUnreadTexts = 8;  // comments beyond the first one
+inline constexpr uint8_t kUnreadLayers = 16;  // layers that were merged
+
+// How a JPEG file quantized its colors; formats/jpeg/jpeg_coding.h.
+struct JpegCoding;
 
 // Technical facts of a file for "Get info": lines of at most 36 characters.
 class DetailLines {
@@ -87,6 +99,7 @@ struct PictureRecord {
 
   PictureMetadata metadata;
   uint8_t lostMetadata = 0;            // kLost bits: what the last `write` could not keep
+  uint8_t unread = 0;                  // kUnread bits, by `info`
   std::vector<uint8_t> comment;        // the file's comment text, UTF-8
   // a fault in the file that the decoder passed over; empty when there was none
   FixedText<80> warning;
@@ -96,6 +109,9 @@ struct PictureRecord {
   int32_t page = 0;                    // which of them this is, from 0
   // by `info`: the file holds what a new one would not, deeper samples or further inks
   bool simplified = false;
+  // Ok, or why `image` shows only a part of the picture; only where the request took one
+  Status shortfall = Status::Ok;
+  std::shared_ptr<const JpegCoding> jpegCoding;  // of pictures from JPEG files; else null
   int32_t hotSpotX = 0, hotSpotY = 0;  // of a cursor, pixels from the left and the top
   int32_t reduction =
       1;  // of a picture decoded smaller than it is: how many pixels along each edge one of `image`

@@ -43,6 +43,9 @@ struct ReadRequest {
           // and `height` keep the full size, `image` tells its own
   bool signedOnly = false;  // of `info`: a format that knows its files by no signature answers
                             // UnsupportedFormat (8) without opening the file
+  // A picture whose data end early is delivered as far as it goes: Ok, with `shortfall` in the
+  // record. At least one row of it is there.
+  bool partial = false;
   ProgressSink* progress = nullptr;  // not owned, may be null
   StopToken stop = {};               // asked between rows; the status is FunctionCancelled (4) then
   ReadOptions options = {};

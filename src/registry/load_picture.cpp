@@ -106,6 +106,7 @@ Status ReadPicture(const ReadRequest& request, PictureRecord& picture) {
   picture.page = request.page;
   picture.progress = request.progress;
   picture.stop = request.stop;
+  picture.shortfall = Status::Ok;
   return row.read(picture, request);
 }
 

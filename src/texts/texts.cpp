@@ -184,8 +184,9 @@ RecordedText TrRecordedArguments(const char* text, std::initializer_list<TextArg
 }
 
 void RecordedText::Append(const RecordedText& more) {
-  (english += ' ') += more.english;
-  (shown += ' ') += more.shown;
+  if (more.empty()) return;
+  (english += empty() ? "" : " ") += more.english;
+  (shown += shown.empty() ? "" : " ") += more.shown;
 }
 
 std::string TrCountArguments(const char* one, const char* many, uint64_t count,

@@ -75,13 +75,18 @@ bool WriteThumbnailForPicture(const std::string& picturePath, const PictureRecor
 }
 
 Status MakeThumbnailOfFile(const std::string& picturePath, const ThumbnailOptions& options,
-                           ThumbnailRecord& record) {
+                           ThumbnailRecord& record, Status* shortfall) {
   PicturePointer picture;
   // The quick scaler's result depends on the size that it starts from.
   const int32_t side = options.quick     ? 0
                        : options.onFaces ? kFramingSide
                                          : kSmallThumbnailSide;
-  RETURN_IF_BAD(LoadPicture({.fileName = picturePath, .thumbnailSide = side, .options = options.read}, picture));
+  const ReadRequest request{.fileName = picturePath,
+                            .thumbnailSide = side,
+                            .partial = shortfall != nullptr,
+                            .options = options.read};
+  RETURN_IF_BAD(LoadPicture(request, picture));
+  if (shortfall != nullptr) *shortfall = picture->shortfall;
   if (picture->image.Empty()) return Status::EmptyImage;
   if (options.onFaces) RETURN_IF_BAD(FrameOnFaces(*picture, options.faces, options.onAllFaces));
   return MakeThumbnailRecord(record, *picture, options) ? Status::Ok

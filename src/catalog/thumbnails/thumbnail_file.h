@@ -36,9 +36,10 @@ bool WriteThumbnailForPicture(const std::string& picturePath, const PictureRecor
                               Color background);
 
 // Reads a picture, as small as it serves, and makes its record. Statuses of reading, EmptyImage
-// when the format has no pixels, or MemoryAllocationError; `record` is then as before.
+// when the format has no pixels, or MemoryAllocationError; `record` is then as before. With
+// `shortfall` a picture that ends early will do as well; it gets the reason, or Ok.
 Status MakeThumbnailOfFile(const std::string& picturePath, const ThumbnailOptions& options,
-                           ThumbnailRecord& record);
+                           ThumbnailRecord& record, Status* shortfall = nullptr);
 
 // The thumbnail files of a folder to which none of the names in it belongs, the case of letters
 // ignored: regular files, not links, names that begin with "." left out; in byte order. nullopt

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <memory>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -18,6 +19,7 @@
 #include "cli/selection/output_place.h"
 #include "core/plain_name.h"
 #include "core/text.h"
+#include "core/whole_number.h"
 #include "platform/existence.h"
 #include "platform/files.h"
 #include "platform/paths.h"
@@ -44,10 +46,11 @@ struct ConvertOptions {
   std::string overwrite;  // empty: ask where someone can answer, else keep both
   std::string metadata = "keep";
   std::string profile = "keep";  // "keep", "srgb", or a file
-  int32_t quality = 0;  // 1 to 100; 0: as configured
-  int32_t page = 1;     // from 1
+  std::string quality;           // "keep" or 1 to 100; empty: as configured
+  std::string page;              // "all" or from 1; empty: none chosen
   int32_t jobs = 0;
   bool reduce = false;
+  bool salvage = false;
   bool autoOrient = false;
   bool keepTree = false;
   bool keepTimes = false;
@@ -74,10 +77,11 @@ void SetOverwritePolicy(const ConvertOptions& options, const CommandContext& con
 BatchFunction FunctionOf(const ConvertOptions& options, const Recipe* recipe) {
   BatchFunction function{.history = FileFunction::Convert,
                          .out = options.out,
-                         .page = options.page,
                          .jobs = static_cast<uint32_t>(options.jobs),
                          .reduce = options.reduce,
                          .reduceHint = Tr("Use --reduce to reduce them."),
+                         .salvage = options.salvage,
+                         .salvageHint = Tr("Use --salvage to convert what is there."),
                          .autoOrient = options.autoOrient,
                          .keepMetadata = options.metadata == "keep",
                          .keepTimes = options.keepTimes,
@@ -88,6 +92,32 @@ BatchFunction FunctionOf(const ConvertOptions& options, const Recipe* recipe) {
   if (options.apply && recipe != nullptr && recipe->HasSteps())
     function.history = FunctionOfFamily(recipe->First()->family);
   return function;
+}
+
+// Reads --quality and --page. What is wrong with them, or empty.
+std::string ReadNumbers(const ConvertOptions& options, const Recipe* recipe,
+                        BatchFunction& function, BatchJob& job) {
+  const std::string& quality = options.quality;
+  const std::optional<int32_t> number = ParseNumber(quality);
+  const bool moves =
+      recipe != nullptr && recipe->HasSteps() ? recipe->OnlyMovesPixels() : options.autoOrient;
+  if (quality == "keep" || (quality.empty() && moves)) {
+    job.encode.jpegAsSource = true;
+  } else if (number && *number >= 1 && *number <= 100) {
+    job.encode.jpegQuality = job.encode.webpQuality = *number;
+    function.encodesAnew = true;
+  } else if (!quality.empty()) {
+    return Tr("--quality: \"%1\" is neither keep nor a whole number from 1 to 100.", quality);
+  }
+  const std::optional<int32_t> page = ParseNumber(options.page);
+  if (options.page == "all") {
+    function.page = kAllPages;
+  } else if (page && *page >= 1) {
+    function.page = *page;
+  } else if (!options.page.empty()) {
+    return Tr("--page: \"%1\" is neither all nor a whole number of at least 1.", options.page);
+  }
+  return {};
 }
 
 // Reads --profile. What is wrong with it, or empty.
@@ -169,7 +199,7 @@ std::string TakeRecipe(const ConvertOptions& options, const std::shared_ptr<cons
       !wrong.empty()) {
     return wrong;
   }
-  if (options.quality > 0) {  // an option of the command line wins over the recipe
+  if (!options.quality.empty()) {  // an option of the command line wins over the recipe
     for (BatchOutput& output : function.outputs) {
       output.quality = 0;
       output.mostBytes = 0;
@@ -219,6 +249,8 @@ int RunConvert(ConvertOptions options, const CommandContext& context) {
   if (const std::string wrong = CheckOptions(options, context, recipe.get(), job); !wrong.empty())
     return UsageError(context, wrong);
   BatchFunction function = FunctionOf(options, recipe.get());
+  if (const std::string wrong = ReadNumbers(options, recipe.get(), function, job); !wrong.empty())
+    return UsageError(context, wrong);
   if (const std::string wrong = ReadProfile(options, job, function.profile); !wrong.empty())
     return UsageError(context, wrong);
   if (const std::string wrong = TakeRecipe(options, recipe, job, function); !wrong.empty())
@@ -227,7 +259,6 @@ int RunConvert(ConvertOptions options, const CommandContext& context) {
   if (!selection) return kExitUsage;
   if (!options.out.empty() && selection->files.size() != 1)
     return UsageError(context, Tr("--out takes exactly one picture."));
-  if (options.quality > 0) job.encode.jpegQuality = job.encode.webpQuality = options.quality;
 
   const bool streams = options.out == kStream;
   const CommandContext shown = streams ? WithResultsOnError(context) : context;
@@ -286,9 +317,13 @@ void SetUp(CLI::App& app, CommandContext& context, const std::shared_ptr<Convert
   AddName(app, "--profile", options->profile, "keep|srgb|FILE",
           "Color profile: keep (default), convert to sRGB, or convert to the profile in FILE");
   AddFlag(app, "--auto-orient", options->autoOrient, "Rotate pictures upright by EXIF orientation");
+  AddFlag(app, "--salvage", options->salvage,
+          "Convert what can be read of files that end early, such as broken downloads");
   AddFlag(app, "--reduce", options->reduce, "Reduce colors if the format supports fewer");
-  AddNumber(app, "--quality", options->quality, "N", 1, 100, "JPEG and WebP quality, 1 to 100");
-  AddNumber(app, "--page", options->page, "N", 1, INT32_MAX, "Page to convert, from 1");
+  AddName(app, "--quality", options->quality, "N|keep",
+          "JPEG and WebP quality, 1 to 100; keep: that of a JPEG source");
+  AddName(app, "--page", options->page, "N|all",
+          "Page to convert, from 1; all: every page, into one file if the format holds several");
   AddNumber(app, "-j,--jobs", options->jobs, "N", 0, INT32_MAX,
             "Number of parallel jobs (default: 0, one per core)");
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be done");

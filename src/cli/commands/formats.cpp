@@ -32,7 +32,7 @@ Json RowAsJson(int32_t index) {
   if (row.limits.width < INT32_MAX) element["maxWidth"] = row.limits.width;
   if (row.limits.height < INT32_MAX) element["maxHeight"] = row.limits.height;
   if (row.limits.exact) element["exactSize"] = true;
-  element["writesPages"] = row.writesPages;
+  element["writesPages"] = row.sequence != nullptr;
   element["childProcess"] = row.childTask != nullptr;
   element["details"] = row.details != nullptr;
   element["options"] = row.options != nullptr;

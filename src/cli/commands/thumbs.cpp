@@ -70,9 +70,10 @@ const char* NameOf(ThumbnailState state) {
 }
 
 // A dry run does all but write; a thumbnail file that is write-protected would be replaced.
-Status MakeThumbnail(const std::string& name, const ThumbnailOptions& options, bool dryRun) {
+Status MakeThumbnail(const std::string& name, const ThumbnailOptions& options, bool dryRun,
+                     Status& shortfall) {
   ThumbnailRecord record;
-  RETURN_IF_BAD(MakeThumbnailOfFile(name, options, record));
+  RETURN_IF_BAD(MakeThumbnailOfFile(name, options, record, &shortfall));
   const std::string path = ThumbnailPathFor(name);
   const bool made = dryRun ? platform::MayCreate(platform::IsRegularFile(path) ? path + "~" : path)
                            : WriteThumbnailFile(record, path, options.hidden);
@@ -82,6 +83,7 @@ Status MakeThumbnail(const std::string& name, const ThumbnailOptions& options, b
 // A selected file and its result.
 struct Making {
   Status status = Status::Ok;
+  Status shortfall = Status::Ok;  // why the thumbnail shows only a part of its picture
   std::string hint = {};         // after the message of a failure
   bool wanted = false;           // it has no current thumbnail
   // for the first file that uses a thumbnail file: all wanted files that use it, in order
@@ -101,6 +103,13 @@ std::vector<Making> PlanMaking(const std::vector<SelectedFile>& files, bool forc
           .together.push_back(i);
   }
   return makings;
+}
+
+// Says that a picture is only there in part.
+void NotePart(const std::string& name, Status shortfall, ResultOutput& output) {
+  if (shortfall == Status::Ok) return;
+  output.Note(output.ShownMessage(name) + ": " +
+              Tr("The file is incomplete; only a part is shown."));
 }
 
 void ReportMaking(const SelectedFile& file, const Making& making, ResultOutput& output,
@@ -123,6 +132,7 @@ void ReportMaking(const SelectedFile& file, const Making& making, ResultOutput& 
     output.CountFile();
     used.Add(file.name);
     if (!output.IsJson()) output.Line(output.Shown(file.name) + " -> " + output.Shown(thumbnail));
+    NotePart(file.name, making.shortfall, output);
   }
 }
 
@@ -145,8 +155,9 @@ int RunMake(const ThumbsOptions& options, const CommandContext& context) {
             for (const size_t i : makings[item].together) {
               Making& making = makings[i];
               const std::string& name = files[i].name;
-              making.status =
-                  Guarded([&] { return MakeThumbnail(name, thumbnails, options.dryRun); });
+              making.status = Guarded([&] {
+                return MakeThumbnail(name, thumbnails, options.dryRun, making.shortfall);
+              });
               if (making.status == Status::Ok) continue;
               making.hint = making.status == Status::ErrorCreatingFile
                                 ? ReasonSentence()
@@ -213,7 +224,11 @@ int RunShow(const ThumbsOptions& options, const CommandContext& context) {
 
 // A picture upright and in a square; smaller ones keep their size.
 Status DrawPicture(const std::string& name, int32_t side, PicturePointer& picture) {
-  RETURN_IF_BAD(LoadPicture({.fileName = name, .thumbnailSide = side, .options = ReadOptionsFromSettings()}, picture));
+  const ReadRequest request{.fileName = name,
+                            .thumbnailSide = side,
+                            .partial = true,
+                            .options = ReadOptionsFromSettings()};
+  RETURN_IF_BAD(LoadPicture(request, picture));
   RETURN_IF_BAD(TurnUpright(*picture));
   picture->metadata = {};
   const int32_t width = picture->image.Width(), height = picture->image.Height();
@@ -229,6 +244,7 @@ int RunDraw(const ThumbsOptions& options, const CommandContext& context) {
     output.FileFailed(name, status, OpenHint(name, status));
     return output.Finish();
   }
+  NotePart(name, picture->shortfall, output);
   return WriteDrawing(*picture, name, options, output);
 }
 

@@ -25,7 +25,8 @@ void TerminalBox::ShowLine(const ProgressLine& line, const FileOutcome* outcome)
     output_.Line(output_.Shown(outcome->source) + " -> " + output_.Shown(outcome->destination));
   if (tellReplaced_ && outcome->replaced)
     output_.Note(name + Tr("replaced %1.", output_.ShownMessage(outcome->destination)));
-  if (verbose_ && !outcome->note.empty()) output_.Note(name + outcome->note.shown);
+  if (!outcome->note.empty()) output_.Note(name + outcome->note.shown);
+  if (verbose_ && !outcome->detail.empty()) output_.Note(name + outcome->detail.shown);
 }
 
 void TerminalBox::ShowElement(const FileOutcome& outcome) {
@@ -37,6 +38,7 @@ void TerminalBox::ShowElement(const FileOutcome& outcome) {
   PutStatus(element, outcome.status);
   if (outcome.skipped) element["skipped"] = true;
   if (!outcome.note.empty()) element["note"] = outcome.note.english;
+  if (!outcome.detail.empty()) element["detail"] = outcome.detail.english;
   output_.Element(element);
 }
 

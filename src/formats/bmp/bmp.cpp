@@ -50,6 +50,7 @@
 #include "core/checked.h"
 #include "core/text.h"
 #include "formats/bmp/bmp_runs.h"
+#include "picture/partial.h"
 #include "platform/file_view.h"
 #include "processing/pixel_rows.h"
 
@@ -254,34 +255,42 @@ Status CheckRowsFit(const platform::FileView& file, const BmpHeader& header) {
   return counted && end <= file.FileSize() ? Status::Ok : Status::FileReadError;
 }
 
+// How many rows the file holds in full, at most all of them.
+int32_t RowsInFile(const platform::FileView& file, const BmpHeader& header) {
+  const uint64_t bytes = file.FileSize() - header.PixelOffset();
+  const uint64_t stride = std::max<uint64_t>(header.FileStride(), 1);
+  return static_cast<int32_t>(
+      std::min<uint64_t>(bytes / stride, static_cast<uint64_t>(header.Rows())));
+}
+
 int32_t RowsPerChunk(uint64_t stride) {
   return static_cast<int32_t>(std::max<uint64_t>(kChunkSize / stride, 1));
 }
 
-// Rows stored as in memory are copied directly.
-Status ReadRowsUnchanged(const platform::FileView& file, const BmpHeader& header,
+// The first `rows` rows, stored as in memory, are copied directly.
+Status ReadRowsUnchanged(const platform::FileView& file, const BmpHeader& header, int32_t rows,
                          const PictureRecord& picture, PackedImage& image) {
   const int32_t height = image.Height();
   const uint64_t stride = image.Stride();
   const int32_t step = header.TopDown() ? 1 : RowsPerChunk(stride);
-  for (int32_t r = 0; r < height; r += step) {
-    const int32_t count = std::min(step, height - r);
+  for (int32_t r = 0; r < rows; r += step) {
+    const int32_t count = std::min(step, rows - r);
     const uint64_t place = static_cast<uint64_t>(header.TopDown() ? height - 1 - r : r) * stride;
-    const std::span<uint8_t> rows =
+    const std::span<uint8_t> target =
         image.Rows().subspan(place, static_cast<uint64_t>(count) * stride);
-    if (!file.ReadAt(header.PixelOffset() + static_cast<uint64_t>(r) * stride, rows))
+    if (!file.ReadAt(header.PixelOffset() + static_cast<uint64_t>(r) * stride, target))
       return Status::FileReadError;
     for (int32_t i = 0; i < count; ++i) RETURN_IF_BAD(picture.ReportRow(r + i));
   }
   return Status::Ok;
 }
 
-Status ReadRowsConverted(platform::FileView& file, const BmpHeader& header,
+Status ReadRowsConverted(platform::FileView& file, const BmpHeader& header, int32_t rows,
                          const PictureRecord& picture, RowReader readRow, PackedImage& image,
                          PackedImage& alpha) {
   const int32_t height = image.Height();
   const uint64_t stride = header.FileStride();
-  for (int32_t r = 0; r < height; ++r) {
+  for (int32_t r = 0; r < rows; ++r) {
     const uint64_t offset = header.PixelOffset() + static_cast<uint64_t>(r) * stride;
     const std::span<const uint8_t> source =
         file.Bytes().subspan(offset, std::min(stride, file.FileSize() - offset));
@@ -423,24 +432,29 @@ Status BmpRead(PictureRecord& picture, const ReadRequest& request) {
 
   const bool runLength = header.compression == kRle8 || header.compression == kRle4;
   if (header.PixelOffset() > file.FileSize()) return Status::FileReadError;
-  if (!runLength) RETURN_IF_BAD(CheckRowsFit(file, header));
+  const Status fits = runLength ? Status::Ok : CheckRowsFit(file, header);
+  const int32_t rows = fits == Status::Ok ? header.Rows() : RowsInFile(file, header);
+  RETURN_IF_BAD(TakePart(picture, request.partial, fits, rows));
 
   PackedImage image, alpha;
-  RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette, picture.bitsPerPixel, image,
-                               runLength ? platform::Fill::Zero : platform::Fill::Unset));
+  RETURN_IF_BAD(NewPackedImage(
+      picture.width, picture.height, &picture.palette, picture.bitsPerPixel, image,
+      runLength || fits != Status::Ok ? platform::Fill::Zero : platform::Fill::Unset));
   if (header.bits > 24 && request.options.alphaChannels) {
     RETURN_IF_BAD(NewAlphaPlane(picture.width, picture.height, alpha));
   }
 
   if (runLength) {
     const BmpRuns runs{header.PixelOffset(), header.compression == kRle4, header.TopDown()};
-    RETURN_IF_BAD(DecodeBmpRuns(file, runs, picture, image));
+    const Status decoded = DecodeBmpRuns(file, runs, picture, image);
+    RETURN_IF_BAD(TakePart(picture, request.partial, decoded,
+                           file.FileSize() > header.PixelOffset() ? 1 : 0));
   } else if (header.bits == image.Bits()) {
-    RETURN_IF_BAD(ReadRowsUnchanged(file, header, picture, image));
+    RETURN_IF_BAD(ReadRowsUnchanged(file, header, rows, picture, image));
   } else {
     RowReader reader = nullptr;
     RETURN_IF_BAD(ChooseRowReader(file, header, alpha, reader));
-    RETURN_IF_BAD(ReadRowsConverted(file, header, picture, reader, image, alpha));
+    RETURN_IF_BAD(ReadRowsConverted(file, header, rows, picture, reader, image, alpha));
   }
   picture.image = std::move(image);
   picture.alpha = std::move(alpha);

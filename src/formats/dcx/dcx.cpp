@@ -11,6 +11,9 @@
 #include "formats/dcx/dcx.h"
 
 #include <algorithm>
+#include <memory>
+#include <string>
+#include <utility>
 #include <vector>
 
 #include "core/byte_reader.h"
@@ -73,19 +76,54 @@ Status DcxRead(PictureRecord& picture, const ReadRequest& request) {
   if (!file.Open(request.fileName)) return Status::FileOpenError;
   PcxPlace place;
   RETURN_IF_BAD(FindPage(file, request.page, picture, place));
-  return ReadPcx(file, place, picture);
+  return ReadPcx(file, place, request, picture);
+}
+
+namespace {
+
+class DcxSequence final : public SequenceWriter {
+ public:
+  explicit DcxSequence(const WriteOptions& options) : options_(options) {}
+  Status Create(const std::string& path) {
+    if (!out_.Create(path)) return Status::ErrorCreatingFile;
+    out_.Le32(kSignature);
+    out_.Zeros(kDirectorySize - out_.Position());
+    return Status::Ok;
+  }
+
+  Status Add(PictureRecord& picture, int32_t) override {
+    if (picture.image.Empty()) return Status::EmptyImage;
+    if (pages_ == kMostPages || out_.Position() > UINT32_MAX) return Status::UnsuitableImage;
+    out_.PatchLe32(4 + 4 * pages_, static_cast<uint32_t>(out_.Position()));
+    ++pages_;
+    return WritePcx(out_, picture);
+  }
+
+  Status Finish() override { return CommitOutput(out_, options_); }
+
+ private:
+  const WriteOptions options_;
+  ByteWriter out_;
+  uint64_t pages_ = 0;
+};
+
+}  // namespace
+
+Status DcxSequenceBegin(const std::string& path, const SequenceFacts&, const WriteOptions& options,
+                        SequencePointer& sequence) {
+  auto made = std::make_unique<DcxSequence>(options);
+  RETURN_IF_BAD(made->Create(path));
+  sequence = std::move(made);
+  return Status::Ok;
 }
 
 Status DcxWrite(PictureRecord& picture, const WriteOptions& options) {
   const ProgressScope progress(picture);
   if (picture.image.Empty()) return Status::MemoryAllocationError;
-  ByteWriter out;
-  if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
-  out.Le32(kSignature);
-  out.Le32(static_cast<uint32_t>(kDirectorySize));
-  out.Zeros(kDirectorySize - out.Position());
-  RETURN_IF_BAD(WritePcx(out, picture));
-  return CommitOutput(out, options);
+  DcxSequence file(options);
+  RETURN_IF_BAD(file.Create(picture.fileName.c_str()));
+  RETURN_IF_BAD(file.Add(picture, 0));
+  return file.Finish();
 }
 
 }  // namespace fotomill

@@ -2,6 +2,7 @@
 
 #include "picture/picture_record.h"
 #include "picture/read_request.h"
+#include "picture/sequence.h"
 #include "picture/write_options.h"
 
 namespace fotomill {
@@ -13,5 +14,8 @@ Status DcxInfo(PictureRecord& picture, const ReadRequest& request);
 Status DcxRead(PictureRecord& picture, const ReadRequest& request);
 // Writes a collection of one page. Statuses of PCX.
 Status DcxWrite(PictureRecord& picture, const WriteOptions& options);
+// A file of several pictures.
+Status DcxSequenceBegin(const std::string& path, const SequenceFacts& facts,
+                        const WriteOptions& options, SequencePointer& sequence);
 
 }  // namespace fotomill

@@ -23,6 +23,7 @@ constexpr FormatEntry kRows[] = {{
     .canRead = true,
     .canWrite = true,
     .signatures = kSignatures,
+    .sequence = DcxSequenceBegin,
 }};
 
 }  // namespace

@@ -216,6 +216,7 @@ Status DescribePicture(const platform::FileView& file, PictureRecord& picture, F
   picture.height = static_cast<int32_t>(header.height);
   picture.bitsPerPixel = 8;
   picture.simplified = header.bitsPerValue > 8 || header.axes > 2;
+  picture.unread = header.bitsPerValue > 8 ? kUnreadDepth : uint8_t{0};
   picture.imageBytes = EstimateImageBytes(picture.width, picture.height, 8);
   picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
   picture.palette = GrayRamp();

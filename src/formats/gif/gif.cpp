@@ -26,9 +26,10 @@
 // file without any palette is read as grays. Bytes of no meaning between blocks are skipped. A
 // missing end code is no fault, missing pixels are (status 3).
 //
-// The writer makes one frame; 89a with the picture's comment when CreateGif89 is on, interlaced
-// rows with WriteGIFInterlaced. Source: CompuServe, "Graphics Interchange Format, Version 89a"
-// (1990); T. Welch, "A Technique for High-Performance Data Compression", IEEE Computer 17 (1984).
+// The writer makes one frame, gif_sequence.cpp several; 89a with the picture's comment when
+// CreateGif89 is on, interlaced rows with WriteGIFInterlaced. Source: CompuServe, "Graphics
+// Interchange Format, Version 89a" (1990); T. Welch, "A Technique for High-Performance Data
+// Compression", IEEE Computer 17 (1984).
 #include "formats/gif/gif.h"
 
 #include <algorithm>
@@ -42,6 +43,7 @@
 #include "formats/gif/gif_blocks.h"
 #include "formats/gif/gif_frames.h"
 #include "formats/gif/gif_lzw.h"
+#include "picture/partial.h"
 #include "platform/file_view.h"
 
 namespace fotomill {
@@ -92,10 +94,13 @@ void PackRow(const uint8_t* indices, int32_t width, int32_t bits, uint8_t* row) 
 }
 
 // A picture with its own palette.
-Status ReadIndexed(ByteReader& bytes, const GifFrame& frame, PictureRecord& picture,
-                   PackedImage& image) {
+Status ReadIndexed(ByteReader& bytes, const GifFrame& frame, const ReadRequest& request,
+                   PictureRecord& picture, PackedImage& image) {
   platform::MemoryBlock pixels;
-  RETURN_IF_BAD(DecodeFrame(bytes, frame, pixels));
+  uint64_t done = 0;
+  const Status status = DecodeFrame(bytes, frame, pixels, request.partial ? &done : nullptr);
+  const uint64_t whole = done / static_cast<uint64_t>(frame.width);
+  RETURN_IF_BAD(TakePart(picture, request.partial, status, static_cast<int64_t>(whole)));
   RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette, picture.bitsPerPixel, image));
   const int32_t rows = std::min(frame.height, picture.height);
   for (int32_t r = 0; r < frame.height; ++r) {
@@ -113,14 +118,19 @@ Status ReadIndexed(ByteReader& bytes, const GifFrame& frame, PictureRecord& pict
   return Status::Ok;
 }
 
-// Draws the frames up to `last`. NoImages when there are fewer.
-Status ReadComposed(ByteReader& bytes, GifScreen& screen, GifFrame frame, int32_t last,
-                    Canvas& canvas) {
+// Draws the frames up to the one that is asked for. NoImages when there are fewer.
+Status ReadComposed(ByteReader& bytes, GifScreen& screen, GifFrame frame,
+                    const ReadRequest& request, PictureRecord& picture, Canvas& canvas) {
   GifDrawing drawing;
   RETURN_IF_BAD(drawing.Begin(screen, canvas));
   for (int32_t page = 0;; ++page) {
+    if (page == request.page && request.partial) {
+      int32_t rows = 0;
+      const Status status = drawing.Draw(bytes, frame, canvas, &rows);
+      return TakePart(picture, request.partial, status, rows);
+    }
     RETURN_IF_BAD(drawing.Draw(bytes, frame, canvas));
-    if (page == last) return Status::Ok;
+    if (page == request.page) return Status::Ok;
     RETURN_IF_BAD(NextFrame(bytes, screen, frame));
   }
 }
@@ -134,18 +144,6 @@ void WriteHeader(ByteWriter& out, const PictureRecord& picture, bool version89) 
   out.U8(flags);
   out.Zeros(2);
   out.Bytes(std::span(picture.palette).first(size_t{3} << bits));
-}
-
-void WriteComment(ByteWriter& out, std::span<const uint8_t> comment) {
-  if (comment.empty()) return;
-  out.U8(kExtensionBlock);
-  out.U8(kComment);
-  for (; !comment.empty(); comment = comment.subspan(std::min<size_t>(comment.size(), 255))) {
-    const size_t size = std::min<size_t>(comment.size(), 255);
-    out.U8(static_cast<uint8_t>(size));
-    out.Bytes(comment.first(size));
-  }
-  out.U8(0);
 }
 
 void UnpackRow(std::span<const uint8_t> row, int32_t bits, std::span<uint8_t> indices) {
@@ -207,9 +205,9 @@ Status GifRead(PictureRecord& picture, const ReadRequest& request) {
   RETURN_IF_BAD(DescribePicture(bytes, request.page, screen, frame, picture));
   Canvas made;
   if (picture.bitsPerPixel <= 8) {
-    RETURN_IF_BAD(ReadIndexed(bytes, frame, picture, made.image));
+    RETURN_IF_BAD(ReadIndexed(bytes, frame, request, picture, made.image));
   } else {
-    RETURN_IF_BAD(ReadComposed(bytes, screen, frame, request.page, made));
+    RETURN_IF_BAD(ReadComposed(bytes, screen, frame, request, picture, made));
   }
   if (!file.Intact()) return Status::FileReadError;
   picture.image = std::move(made.image);
@@ -225,7 +223,9 @@ Status GifWrite(PictureRecord& picture, const WriteOptions& options) {
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
   WriteHeader(out, picture, options.encode.gif89);
-  if (options.encode.gif89) WriteComment(out, picture.comment);
+  const bool comment = options.encode.gif89 && options.KeepsMetadata();
+  if (comment) WriteGifComment(out, picture.comment);
+  if (!comment) picture.lostMetadata |= kLostComment;
   RETURN_IF_BAD(WritePixels(out, picture, options.encode.gifInterlaced));
   out.U8(kEndBlock);
   return CommitOutput(out, options);

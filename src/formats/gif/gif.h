@@ -3,6 +3,7 @@
 #include "picture/animation.h"
 #include "picture/picture_record.h"
 #include "picture/read_request.h"
+#include "picture/sequence.h"
 #include "picture/write_options.h"
 
 namespace fotomill {
@@ -16,5 +17,9 @@ Status GifRead(PictureRecord& picture, const ReadRequest& request);
 Status GifWrite(PictureRecord& picture, const WriteOptions& options);
 Status GifDetails(PictureRecord& picture);
 Status GifAnimate(const ReadRequest& request, AnimationPointer& animation);
+// A file with several frames. TooManyColors (12) for a frame of more than 256, the transparent one
+// included; it can be added again with fewer.
+Status GifSequenceBegin(const std::string& path, const SequenceFacts& facts,
+                        const WriteOptions& options, SequencePointer& sequence);
 
 }  // namespace fotomill

@@ -143,16 +143,31 @@ int32_t InterlacedRow(int32_t r, int32_t height) {
   return 0;
 }
 
-Status DecodeFrame(ByteReader& bytes, const GifFrame& frame, platform::MemoryBlock& pixels) {
+Status DecodeFrame(ByteReader& bytes, const GifFrame& frame, platform::MemoryBlock& pixels,
+                   uint64_t* done) {
   const uint64_t count = static_cast<uint64_t>(frame.width) * static_cast<uint64_t>(frame.height);
   if (count > limits.packedBlockBytes) return Status::MemoryAllocationError;
   bytes.Seek(frame.dataOffset);
-  if (bytes.Left() < count / kMostPixelsPerByte) return Status::FileReadError;
-  if (!pixels.Allocate(count, platform::Fill::Unset)) return Status::MemoryAllocationError;
-  RETURN_IF_BAD(DecodeGifPixels(bytes, pixels.Bytes()));
+  const bool whole = done == nullptr;
+  if (whole && bytes.Left() < count / kMostPixelsPerByte) return Status::FileReadError;
+  if (!pixels.Allocate(count, whole ? platform::Fill::Unset : platform::Fill::Zero))
+    return Status::MemoryAllocationError;
+  RETURN_IF_BAD(DecodeGifPixels(bytes, pixels.Bytes(), done));
   bytes.Seek(frame.dataOffset + 1);
   SkipFrame(bytes);
   return Status::Ok;
+}
+
+void WriteGifComment(ByteWriter& out, std::span<const uint8_t> comment) {
+  if (comment.empty()) return;
+  out.U8(kExtensionBlock);
+  out.U8(kComment);
+  for (; !comment.empty(); comment = comment.subspan(std::min<size_t>(comment.size(), 255))) {
+    const size_t size = std::min<size_t>(comment.size(), 255);
+    out.U8(static_cast<uint8_t>(size));
+    out.Bytes(comment.first(size));
+  }
+  out.U8(0);
 }
 
 }  // namespace fotomill

@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "core/byte_reader.h"
+#include "core/byte_writer.h"
 #include "core/status.h"
 #include "picture/palette.h"
 #include "platform/memory.h"
@@ -76,12 +77,17 @@ Status NextFrame(ByteReader& bytes, GifScreen& screen, GifFrame& frame,
 // Passes over the LZW data of a frame.
 void SkipFrame(ByteReader& bytes);
 
+// Writes a comment block; nothing for an empty comment.
+void WriteGifComment(ByteWriter& out, std::span<const uint8_t> comment);
+
 // The palette that a frame's pixels mean, a ramp of grays where the file has none.
 void TakeColors(const GifFrame& frame, Palette& palette);
 // The file row that comes as number `r` of an interlaced picture.
 int32_t InterlacedRow(int32_t r, int32_t height);
 // The indices of a frame in the order of the file; the reader is left behind it. FileReadError
-// before any memory is taken when the data cannot hold so many.
-Status DecodeFrame(ByteReader& bytes, const GifFrame& frame, platform::MemoryBlock& pixels);
+// before any memory is taken when the data cannot hold so many. With `done`, which gets how many
+// there are, this happens only behind the last pixel; the rest are 0.
+Status DecodeFrame(ByteReader& bytes, const GifFrame& frame, platform::MemoryBlock& pixels,
+                   uint64_t* done = nullptr);
 
 }  // namespace fotomill

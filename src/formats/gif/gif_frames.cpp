@@ -95,12 +95,15 @@ Status GifDrawing::Begin(const GifScreen& screen, Canvas& canvas) {
   return NewCanvas(screen.width, screen.height, canvas);
 }
 
-Status GifDrawing::Draw(ByteReader& bytes, const GifFrame& frame, Canvas& canvas) {
+Status GifDrawing::Draw(ByteReader& bytes, const GifFrame& frame, Canvas& canvas, int32_t* rows) {
   if (frame.width < 1 || frame.height < 1) return Status::DamagedFile;
   Dispose(canvas);
   if (frame.disposal == kToPrevious) RETURN_IF_BAD(KeepBeneath(frame, canvas));
   platform::MemoryBlock pixels;
-  RETURN_IF_BAD(DecodeFrame(bytes, frame, pixels));
+  uint64_t done = 0;
+  const Status status = DecodeFrame(bytes, frame, pixels, rows != nullptr ? &done : nullptr);
+  if (rows != nullptr) *rows = static_cast<int32_t>(done / static_cast<uint64_t>(frame.width));
+  if (status != Status::Ok && (rows == nullptr || *rows < 1)) return status;
   Palette palette;
   TakeColors(frame, palette);
   const std::vector<int32_t> order = RowOrder(frame);
@@ -110,7 +113,7 @@ Status GifDrawing::Draw(ByteReader& bytes, const GifFrame& frame, Canvas& canvas
             palette, ColorsAt(canvas, frame.left, y), AlphaAt(canvas, frame.left, y));
   });
   last_ = frame;
-  return Status::Ok;
+  return status;
 }
 
 // The place of a frame, row by row: colors, then alpha.

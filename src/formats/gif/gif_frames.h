@@ -13,8 +13,9 @@ class GifDrawing {
   // Begins with a transparent canvas of the screen's size. Statuses as NewCanvas.
   Status Begin(const GifScreen& screen, Canvas& canvas);
   // Draws a frame from the data behind `bytes`, which are left behind it. Statuses as DecodeFrame;
-  // DamagedFile for a frame without size.
-  Status Draw(ByteReader& bytes, const GifFrame& frame, Canvas& canvas);
+  // DamagedFile for a frame without size. With `rows`, which gets how many are there in full, a
+  // frame that ends early is drawn as far as it goes.
+  Status Draw(ByteReader& bytes, const GifFrame& frame, Canvas& canvas, int32_t* rows = nullptr);
 
  private:
   Status KeepBeneath(const GifFrame& frame, const Canvas& canvas);

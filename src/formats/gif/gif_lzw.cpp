@@ -60,7 +60,7 @@ void CopyString(uint8_t* to, const uint8_t* from, uint64_t length) {
 
 }  // namespace
 
-Status DecodeGifPixels(ByteReader& bytes, std::span<uint8_t> pixels) {
+Status DecodeGifPixels(ByteReader& bytes, std::span<uint8_t> pixels, uint64_t* decoded) {
   const uint32_t pixelBits = bytes.U8();
   if (!bytes.Ok()) return Status::FileReadError;
   if (pixelBits < 1 || pixelBits >= kMostCodeBits) return Status::DamagedFile;
@@ -69,7 +69,9 @@ Status DecodeGifPixels(ByteReader& bytes, std::span<uint8_t> pixels) {
   CodeReader codes(bytes);
   uint32_t codeBits = pixelBits + 1, nextCode = endCode + 1, code = 0;
   DecodedString before{0, 0};  // the string decoded last; empty after a clear code
-  uint64_t done = 0;
+  uint64_t none = 0;
+  uint64_t& done = decoded != nullptr ? *decoded : none;
+  done = 0;
   while (done < pixels.size()) {
     if (!codes.Next(codeBits, code)) return Status::FileReadError;
     if (code == clearCode) {

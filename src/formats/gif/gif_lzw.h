@@ -16,8 +16,8 @@ namespace fotomill {
 // Decodes pixels.size() indices from `bytes`, which stands at the first byte. Ok as soon as all
 // pixels are there, whether or not an end code follows; the reader is then left somewhere in the
 // data. DamagedFile for a code that cannot be or a pixel size outside 1 to 8, FileReadError when
-// the data end too early.
-Status DecodeGifPixels(ByteReader& bytes, std::span<uint8_t> pixels);
+// the data end too early. `done`, which may be null: how many pixels were decoded in any case.
+Status DecodeGifPixels(ByteReader& bytes, std::span<uint8_t> pixels, uint64_t* done = nullptr);
 
 // Encodes indices of `bits` per pixel (1 to 8), handed over piece by piece in any lengths.
 class GifPixelEncoder {

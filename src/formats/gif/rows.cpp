@@ -35,6 +35,8 @@ constexpr FormatEntry kRows[] = {{
     .canRead = true,
     .canWrite = true,
     .signatures = kSignatures,
+    .keepsMetadata = kLostComment,
+    .sequence = GifSequenceBegin,
     .settings = &kSettings,
 }};
 

@@ -262,6 +262,8 @@ Status Describe(std::span<const uint8_t> file, int32_t index, HdpPage& page,
   picture.height = page.image.height;
   picture.bitsPerPixel = BitsOf(page);
   picture.simplified = page.image.depth != HdpDepth::U8 || page.image.colors >= HdpColors::Cmyk;
+  picture.unread = static_cast<uint8_t>((page.image.depth != HdpDepth::U8 ? kUnreadDepth : 0) |
+                                        (page.image.colors >= HdpColors::Cmyk ? kUnreadInks : 0));
   picture.alphaFlags =
       static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (HasAlpha(page) ? kHasAlpha : 0));
   picture.imageBytes = EstimateImageBytes(picture.width, picture.height, picture.bitsPerPixel);

@@ -41,7 +41,7 @@ constexpr FormatEntry Row(std::string_view extension, std::string_view descripti
           .present = HdpWorksHere,
           .whyNot = TrLater("The library libjxr is not installed."),
           .signatures = kSignatures,
-          .keepsMetadata = kAllMetadata,
+          .keepsMetadata = kAllMetadata & ~kLostMakerNote,
           .hasOptionsBox = hasOptionsBox,
           .settings = &kSettings,
           .libraries = kLibraries};

@@ -28,8 +28,12 @@
 #include "formats/icon/ico.h"
 
 #include <algorithm>
+#include <array>
 #include <cstring>
 #include <functional>
+#include <memory>
+#include <string>
+#include <utility>
 #include <vector>
 
 #include "core/byte_reader.h"
@@ -48,7 +52,6 @@ constexpr uint16_t kIcons = 1, kCursors = 2;
 constexpr uint32_t kInfoSize = 40;
 constexpr int32_t kMostSide = 256;
 constexpr uint32_t kFileHeaderSize = 6, kEntrySize = 16;
-constexpr uint32_t kSizeOffset = kFileHeaderSize + 8;  // of the first entry's size
 
 struct IcoEntry {
   uint16_t hotSpotX = 0, hotSpotY = 0;  // of a cursor
@@ -288,8 +291,6 @@ struct IcoLayout {
   uint32_t colorBytes = 0, maskBytes = 0;
   bool cursor = false;
   bool png = false;
-
-  uint32_t PictureSize() const { return kInfoSize + 4 * colors + colorBytes + maskBytes; }
 };
 
 IcoLayout ChooseLayout(const PictureRecord& picture, bool cursor, int32_t compression) {
@@ -308,18 +309,21 @@ IcoLayout ChooseLayout(const PictureRecord& picture, bool cursor, int32_t compre
   return layout;
 }
 
-void WriteDirectory(ByteWriter& out, const PictureRecord& picture, const IcoLayout& layout) {
-  out.Le16(0);
-  out.Le16(layout.cursor ? kCursors : kIcons);
-  out.Le16(1);
-  out.U8(static_cast<uint8_t>(picture.image.Width()));  // 256 becomes 0, as it should
-  out.U8(static_cast<uint8_t>(picture.image.Height()));
-  out.U8(static_cast<uint8_t>(layout.colors));
-  out.U8(0);
-  out.Le16(layout.cursor ? static_cast<uint16_t>(picture.hotSpotX) : 1);
-  out.Le16(static_cast<uint16_t>(layout.cursor ? picture.hotSpotY : layout.bits));
-  out.Le32(layout.PictureSize());
-  out.Le32(kFileHeaderSize + kEntrySize);
+// An entry of the directory for a picture of `size` bytes at `offset`.
+std::array<uint8_t, kEntrySize> MakeEntry(const PictureRecord& picture, const IcoLayout& layout,
+                                          uint32_t size, uint32_t offset) {
+  std::array<uint8_t, kEntrySize> entry = {};
+  entry[0] = static_cast<uint8_t>(picture.image.Width());  // 256 becomes 0, as it should
+  entry[1] = static_cast<uint8_t>(picture.image.Height());
+  entry[2] = static_cast<uint8_t>(layout.colors);
+  const auto put = [&](size_t at, size_t bytes, uint32_t value) {
+    for (size_t i = 0; i < bytes; ++i) entry[at + i] = static_cast<uint8_t>(value >> 8 * i);
+  };
+  put(4, 2, layout.cursor ? static_cast<uint32_t>(picture.hotSpotX) : 1);
+  put(6, 2, static_cast<uint32_t>(layout.cursor ? picture.hotSpotY : layout.bits));
+  put(8, 4, size);
+  put(12, 4, offset);
+  return entry;
 }
 
 void WriteBitmapHeader(ByteWriter& out, const PictureRecord& picture, const IcoLayout& layout) {
@@ -378,6 +382,51 @@ Status WriteBitmap(ByteWriter& out, const PictureRecord& picture, const IcoLayou
   return Status::Ok;
 }
 
+class IcoSequence final : public SequenceWriter {
+ public:
+  IcoSequence(size_t count, const WriteOptions& options) : count_(count), options_(options) {}
+  Status Create(const std::string& path) {
+    if (count_ < 1 || count_ > UINT16_MAX) return Status::UnsuitableImage;
+    if (!out_.Create(path)) return Status::ErrorCreatingFile;
+    cursor_ = EqualIgnoringCase(platform::ExtensionOf(path), "cur");
+    out_.Le16(0);
+    out_.Le16(cursor_ ? kCursors : kIcons);
+    out_.Le16(static_cast<uint16_t>(count_));
+    out_.Zeros(count_ * kEntrySize);
+    return Status::Ok;
+  }
+
+  Status Add(PictureRecord& picture, int32_t) override {
+    if (picture.image.Empty()) return Status::EmptyImage;
+    if (done_ == count_) return Status::UnsuitableImage;
+    const IcoLayout layout = ChooseLayout(picture, cursor_, options_.encode.iconCompression);
+    const uint64_t start = out_.Position();
+    if (layout.png) {
+      RETURN_IF_BAD(EncodePng(picture, options_.encode, out_));
+    } else {
+      RETURN_IF_BAD(WriteBitmap(out_, picture, layout));
+    }
+    const uint64_t end = out_.Position();
+    if (end > UINT32_MAX) return Status::UnsuitableImage;
+    out_.Patch(kFileHeaderSize + done_ * kEntrySize,
+               MakeEntry(picture, layout, static_cast<uint32_t>(end - start),
+                         static_cast<uint32_t>(start)));
+    ++done_;
+    return Status::Ok;
+  }
+
+  Status Finish() override {
+    return done_ == count_ ? CommitOutput(out_, options_) : Status::UnsuitableImage;
+  }
+
+ private:
+  const size_t count_;  // of pictures, as the file's head says
+  const WriteOptions options_;
+  ByteWriter out_;
+  bool cursor_ = false;
+  size_t done_ = 0;
+};
+
 }  // namespace
 
 Status DescribeIcon(std::span<const uint8_t> file, const ReadRequest& request,
@@ -400,7 +449,11 @@ Status DecodeIcon(std::span<const uint8_t> file, const ReadRequest& request,
 
 Status EncodeCursor(const PictureRecord& picture, ByteWriter& out) {
   const IcoLayout layout = ChooseLayout(picture, true, choice::kIconBitmaps);
-  WriteDirectory(out, picture, layout);
+  out.Le16(0);
+  out.Le16(kCursors);
+  out.Le16(1);
+  const uint32_t size = kInfoSize + 4 * layout.colors + layout.colorBytes + layout.maskBytes;
+  out.Bytes(MakeEntry(picture, layout, size, kFileHeaderSize + kEntrySize));
   return WriteBitmap(out, picture, layout);
 }
 
@@ -428,20 +481,18 @@ Status IcoRead(PictureRecord& picture, const ReadRequest& request) {
 Status IcoWrite(PictureRecord& picture, const WriteOptions& options) {
   const ProgressScope progress(picture);
   if (picture.image.Empty()) return Status::MemoryAllocationError;
-  ByteWriter out;
-  if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
-  const IcoLayout layout =
-      ChooseLayout(picture, EqualIgnoringCase(platform::ExtensionOf(picture.fileName), "cur"),
-                   options.encode.iconCompression);
-  WriteDirectory(out, picture, layout);
-  if (layout.png) {
-    RETURN_IF_BAD(EncodePng(picture, options.encode, out));
-    out.PatchLe32(kSizeOffset,
-                  static_cast<uint32_t>(out.Position()) - kFileHeaderSize - kEntrySize);
-  } else {
-    RETURN_IF_BAD(WriteBitmap(out, picture, layout));
-  }
-  return CommitOutput(out, options);
+  IcoSequence file(1, options);
+  RETURN_IF_BAD(file.Create(picture.fileName.c_str()));
+  RETURN_IF_BAD(file.Add(picture, 0));
+  return file.Finish();
+}
+
+Status IcoSequenceBegin(const std::string& path, const SequenceFacts& facts,
+                        const WriteOptions& options, SequencePointer& sequence) {
+  auto made = std::make_unique<IcoSequence>(facts.count, options);
+  RETURN_IF_BAD(made->Create(path));
+  sequence = std::move(made);
+  return Status::Ok;
 }
 
 }  // namespace fotomill

@@ -5,6 +5,7 @@
 #include "core/byte_writer.h"
 #include "picture/picture_record.h"
 #include "picture/read_request.h"
+#include "picture/sequence.h"
 #include "picture/write_options.h"
 
 namespace fotomill {
@@ -18,6 +19,9 @@ Status IcoRead(PictureRecord& picture, const ReadRequest& request);
 // Writes one entry; a cursor when the extension is "cur". Also ErrorCreatingFile (10),
 // ErrorWritingFile (11).
 Status IcoWrite(PictureRecord& picture, const WriteOptions& options);
+// A file of several pictures.
+Status IcoSequenceBegin(const std::string& path, const SequenceFacts& facts,
+                        const WriteOptions& options, SequencePointer& sequence);
 
 // The same for a file that stands inside another one: facts, pixels, and a cursor of one bitmap
 // with its mask, which a picture of at most 256 x 256 pixels becomes. `picture` keeps its file's

@@ -34,6 +34,7 @@ constexpr FormatEntry Row(std::string_view extension, std::string_view descripti
           .canRead = true,
           .canWrite = true,
           .signatures = signatures,
+          .sequence = (flags & FMT_MULTI) != 0 ? IcoSequenceBegin : nullptr,
           .hasOptionsBox = hasOptionsBox,
           .settings = &kSettings};
 }

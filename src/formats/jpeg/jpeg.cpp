@@ -31,8 +31,10 @@
 #include "core/byte_writer.h"
 #include "core/choice_lists.h"
 #include "core/limits.h"
+#include "formats/jpeg/jpeg_coding.h"
 #include "formats/jpeg/jpeg_library.h"
 #include "picture/gray_palette.h"
+#include "picture/partial.h"
 #include "platform/file_view.h"
 
 namespace fotomill {
@@ -40,7 +42,7 @@ namespace fotomill {
 namespace {
 
 constexpr std::string_view kIccHead("ICC_PROFILE\0", 12);
-constexpr int kApp1 = JPEG_APP0 + 1, kApp2 = JPEG_APP0 + 2;
+constexpr int kApp1 = JPEG_APP0 + 1, kApp2 = JPEG_APP0 + 2, kApp13 = JPEG_APP0 + 13;
 
 bool IsGray(const jpeg_decompress_struct& info) { return info.jpeg_color_space == JCS_GRAYSCALE; }
 bool IsCmyk(const jpeg_decompress_struct& info) {
@@ -74,9 +76,13 @@ void TakeMetadata(const JpegReader& reader, PictureRecord& picture) {
   PictureMetadata& metadata = picture.metadata;
   metadata = {};
   picture.comment.clear();
+  picture.unread = 0;
   for (const JpegSegment& segment : reader.segments) {
     const std::string_view data = DataOf(segment);
-    if (segment.marker == JPEG_COM) {
+    if (segment.marker == kApp13) {
+      picture.unread |= kUnreadIptc;
+    } else if (segment.marker == JPEG_COM) {
+      if (!picture.comment.empty()) picture.unread |= kUnreadTexts;
       if (picture.comment.empty()) Append(picture.comment, data.substr(0, data.find('\0')));
     } else if (segment.marker == kApp1 && data.starts_with(kExifHead) && metadata.exif.empty()) {
       Append(metadata.exif, data.substr(kExifHead.size()));
@@ -132,7 +138,8 @@ void CmykToBgr(const uint8_t* ink, uint8_t* color, size_t width) {
   }
 }
 
-Status ReadPixels(JpegReader& reader, const PictureRecord& picture, PackedImage& image) {
+Status ReadPixels(JpegReader& reader, const ReadRequest& request, PictureRecord& picture,
+                  PackedImage& image) {
   jpeg_decompress_struct& info = reader.info;
   const bool cmyk = info.out_color_space == JCS_CMYK;
   std::vector<uint8_t> ink(cmyk ? 4 * static_cast<size_t>(info.output_width) : 0);
@@ -151,7 +158,9 @@ Status ReadPixels(JpegReader& reader, const PictureRecord& picture, PackedImage&
   });
   if (!read) return reader.Failure();
   RETURN_IF_BAD(status);
-  return reader.errors.cutShort && reader.errors.endMissing ? Status::FileReadError : Status::Ok;
+  const bool ended = reader.errors.cutShort && reader.errors.endMissing;
+  return TakePart(picture, request.partial, ended ? Status::FileReadError : Status::Ok,
+                  reader.errors.wholeRows);
 }
 
 struct JpegWriter {
@@ -216,6 +225,7 @@ void SetParameters(JpegWriter& writer, const PictureRecord& picture, bool gray,
   jpeg_set_defaults(&info);
   jpeg_set_quality(&info, std::clamp<int>(options.jpegQuality, 1, 100), TRUE);
   SetSampling(info, options.jpegSubsampling);
+  if (options.jpegAsSource && picture.jpegCoding != nullptr) SetCoding(info, *picture.jpegCoding);
   if (options.jpegStoresResolution) SetResolution(info, picture.metadata, options.resolution);
   if (options.jpegProgressive) {
     jpeg_simple_progression(&info);
@@ -373,11 +383,12 @@ Status JpegStreamRead(PictureRecord& picture, const ReadRequest& request, const 
              height = static_cast<int32_t>(reader.info.output_height);
   RETURN_IF_BAD(CheckFileMemory(JpegCoefficientBytes(reader, false) + PackedRowBytes(width, height, picture.bitsPerPixel)));
   RETURN_IF_BAD(NewPackedImage(width, height, &picture.palette, picture.bitsPerPixel, image));
-  RETURN_IF_BAD(ReadPixels(reader, picture, image));
+  RETURN_IF_BAD(ReadPixels(reader, request, picture, image));
   if (!file.Intact()) return Status::FileReadError;
   picture.warning.AssignCut(reader.errors.warning);
   picture.note.AssignCut(reader.errors.note);
   picture.reduction = static_cast<int32_t>(reader.info.scale_denom / reader.info.scale_num);
+  picture.jpegCoding = CodingOf(reader.info);
   picture.image = std::move(image);
   return Status::Ok;
 }

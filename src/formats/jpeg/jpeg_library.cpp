@@ -20,6 +20,16 @@ JpegErrors& ErrorsOf(j_common_ptr common) {
   std::longjmp(ErrorsOf(common).jump, 1);
 }
 
+// How many rows of the picture the data have given so far; for one in several scans 1 stands for
+// all of them, coarse as they may be.
+int64_t RowsOut(j_common_ptr common) {
+  if (common->is_decompressor == FALSE) return 0;
+  auto* info = static_cast<j_decompress_ptr>(static_cast<void*>(common));
+  if (jpeg_has_multiple_scans(info) != FALSE)
+    return info->input_scan_number > 1 || info->input_iMCU_row > 0 ? 1 : 0;
+  return info->output_scanline;
+}
+
 // Message codes are not part of the library's public header; their texts are stable.
 void OnMessage(j_common_ptr common, int level) {
   if (level >= 0) return;  // trace
@@ -31,6 +41,7 @@ void OnMessage(j_common_ptr common, int level) {
   if (message.starts_with("Premature end of JPEG file")) {
     errors.endMissing = true;
   } else if (message.find("premature end of data segment") != std::string_view::npos) {
+    if (!errors.cutShort) errors.wholeRows = RowsOut(common);
     errors.cutShort = true;
   }
   const bool damage = message.starts_with("Corrupt JPEG data") &&
@@ -50,10 +61,19 @@ void Watch(j_common_ptr common) {
     common->err->error_exit(common);
 }
 
-// Whether a segment is one that travels with the picture.
+// Whether it is one of Adobe's with captions and keywords. Source: Adobe, "Photoshop File Formats
+// Specification", image resources; 1028 is IPTC.
+bool HoldsIptc(const JpegSegment& segment) {
+  constexpr uint8_t kApp13 = JPEG_APP0 + 13;
+  constexpr std::string_view kHead("Photoshop 3.0\0", 14), kIptc("8BIM\x04\x04", 6);
+  return segment.marker == kApp13 && segment.Starts(kHead) &&
+         TextOf(segment.data).find(kIptc) != std::string_view::npos;
+}
+
+// Whether a segment is one that travels with the picture, or that is missed where it does not.
 bool IsKept(const JpegSegment& segment) {
   constexpr int kApp1 = JPEG_APP0 + 1, kApp2 = JPEG_APP0 + 2;
-  return segment.marker == JPEG_COM || segment.marker == kApp2 ||
+  return segment.marker == JPEG_COM || segment.marker == kApp2 || HoldsIptc(segment) ||
          (segment.marker == kApp1 && (segment.Starts(kExifHead) || segment.Starts(kXmpHead)));
 }
 

@@ -21,6 +21,7 @@ struct JpegErrors {
   jpeg_error_mgr base;  // first, so that the library's pointer leads to the whole
   std::jmp_buf jump;
   bool cutShort = false;  // the data ended within a scan
+  int64_t wholeRows = 0;  // that were out before that; of pictures in several scans all
   bool endMissing = false;
   char warning[JMSG_LENGTH_MAX] = {};  // the first one of damage, but for a missing end
   char note[JMSG_LENGTH_MAX] = {};     // the first one of what is odd and harms no pixel

@@ -3,6 +3,7 @@
 #include <jconfig.h>
 #include <jmorecfg.h>
 
+#include "containers/bare_file.h"
 #include "formats/jpeg/jpeg.h"
 #include "texts/texts.h"
 
@@ -46,6 +47,7 @@ constexpr FormatEntry Row(std::string_view extension, std::string_view descripti
           .canWrite = true,
           .signatures = kSignatures,
           .keepsMetadata = kAllMetadata,
+          .bare = MakeBareJpeg,
           .turnsWithoutLoss = true,
           .hasOptionsBox = first,
           .settings = &kSettings,

@@ -63,6 +63,7 @@ Status DescribePicture(const PspFile& psp, int32_t page, PictureRecord& picture)
                                             (HasAlpha(psp, page) ? kHasAlpha : 0));
   picture.simplified =
       psp.bits == 16 || psp.bits == 48 || psp.layers.size() > 1 || psp.otherLayers > 0;
+  picture.unread = psp.bits == 16 || psp.bits == 48 ? kUnreadDepth : uint8_t{0};
   picture.metadata.dpiX = picture.metadata.dpiY = psp.dpi;
   picture.warning.Clear();
   const bool plain =

@@ -33,6 +33,7 @@
 #include "core/byte_writer.h"
 #include "formats/pcx/pcx_page.h"
 #include "formats/pcx/pcx_runs.h"
+#include "picture/partial.h"
 #include "platform/file_view.h"
 #include "processing/pixel_rows.h"
 
@@ -281,13 +282,15 @@ Status DescribePcx(const platform::FileView& file, const PcxPlace& place, Pictur
   return DescribePicture(file, place, picture, header);
 }
 
-Status ReadPcx(platform::FileView& file, const PcxPlace& place, PictureRecord& picture) {
+Status ReadPcx(platform::FileView& file, const PcxPlace& place, const ReadRequest& request,
+               PictureRecord& picture) {
   PcxHeader header;
   RETURN_IF_BAD(DescribePicture(file, place, picture, header));
   PackedImage image;
   platform::MemoryBlock line;
   RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette,
-                               picture.bitsPerPixel, image, platform::Fill::Unset));
+                               picture.bitsPerPixel, image,
+                               request.partial ? platform::Fill::Zero : platform::Fill::Unset));
   if (!line.Allocate(header.LineSize() + PcxLineDecoder::kSlack))
     return Status::MemoryAllocationError;
   const SpreadRow spread = FindArrangement(header)->spread;
@@ -295,7 +298,10 @@ Status ReadPcx(platform::FileView& file, const PcxPlace& place, PictureRecord& p
   PcxLineDecoder decoder(
       file.Bytes().subspan(place.begin + kHeaderSize, place.Size() - kHeaderSize));
   for (int32_t y = 0; y < header.height; ++y) {
-    if (!decoder.Decode(line.Data(), header.LineSize())) return Status::FileReadError;
+    if (!decoder.Decode(line.Data(), header.LineSize())) {
+      RETURN_IF_BAD(TakePart(picture, request.partial, Status::FileReadError, y));
+      break;
+    }
     spread(decoded, header, image.Row(y));
     file.DropBefore(static_cast<uint64_t>(decoder.Next() - file.Bytes().data()));
     RETURN_IF_BAD(picture.ReportRow(y));
@@ -332,7 +338,7 @@ Status PcxRead(PictureRecord& picture, const ReadRequest& request) {
   picture.alpha.Free();
   platform::FileView file;
   if (!file.Open(request.fileName)) return Status::FileOpenError;
-  return ReadPcx(file, {0, file.FileSize()}, picture);
+  return ReadPcx(file, {0, file.FileSize()}, request, picture);
 }
 
 Status PcxWrite(PictureRecord& picture, const WriteOptions& options) {

@@ -20,7 +20,8 @@ struct PcxPlace {
 // no more of the file to be visible than its first byte. ReadPcx leaves `image` alone unless it
 // succeeds.
 Status DescribePcx(const platform::FileView& file, const PcxPlace& place, PictureRecord& picture);
-Status ReadPcx(platform::FileView& file, const PcxPlace& place, PictureRecord& picture);
+Status ReadPcx(platform::FileView& file, const PcxPlace& place, const ReadRequest& request,
+               PictureRecord& picture);
 // Writes the picture at the writer's position; the commit is the caller's.
 Status WritePcx(ByteWriter& out, const PictureRecord& picture);
 

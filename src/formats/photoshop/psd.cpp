@@ -97,6 +97,9 @@ Status DescribePicture(const PsdFile& document, PictureRecord& picture) {
                                             (HasAlpha(document) ? kHasAlpha : 0));
   picture.simplified =
       header.depth == 16 || document.layerCount > 0 || header.channels > 4 || !KeepsProfile(header);
+  picture.unread = static_cast<uint8_t>(
+      (header.depth == 16 ? kUnreadDepth : 0) | (document.layerCount > 0 ? kUnreadLayers : 0) |
+      (header.channels > 4 || !KeepsProfile(header) ? kUnreadInks : 0));
   if (picture.bitsPerPixel == 24) {
     MakeDefaultPalette(&picture.palette, nullptr, kDisplayPalette);
   } else {

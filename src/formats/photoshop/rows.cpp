@@ -27,7 +27,7 @@ constexpr FormatEntry Row(std::string_view extension, std::string_view descripti
           .canRead = true,
           .canWrite = true,
           .signatures = signatures,
-          .keepsMetadata = kAllMetadata};
+          .keepsMetadata = kAllMetadata & ~kLostComment};
 }
 
 constexpr FormatEntry kRows[] = {

@@ -17,6 +17,8 @@
 // Specification (Third Edition)", 2025; libpng manual.
 #include "formats/png/png.h"
 
+#include <libdeflate.h>
+
 #include <algorithm>
 #include <cmath>
 #include <cstring>
@@ -30,7 +32,10 @@
 #include "formats/png/png_pixels.h"
 #include "formats/png/png_text.h"
 #include "picture/gray_palette.h"
+#include "picture/partial.h"
 #include "platform/file_view.h"
+#include "processing/flatten.h"
+#include "processing/geometry/cut.h"
 #include "processing/pixel_rows.h"
 
 namespace fotomill {
@@ -220,7 +225,9 @@ Status Describe(PngReader& reader, std::span<const uint8_t> file, PngLayout& lay
   layout = ChooseLayout(reader);
   const int32_t frames = FrameCount(file);
   picture.pageCount = options.recognizeApng ? frames : 1;
-  picture.simplified = frames > 1 || png_get_bit_depth(reader.png, reader.info) > 8;
+  const bool deep = png_get_bit_depth(reader.png, reader.info) > 8;
+  picture.simplified = frames > 1 || deep;
+  picture.unread = deep ? kUnreadDepth : uint8_t{0};
   picture.typeName.AssignCut(picture.pageCount > 1 ? "Animated PNG" : "Portable Network Graphics");
   picture.width = layout.width;
   picture.height = layout.height;
@@ -253,9 +260,9 @@ void StoreRow(const PngLayout& layout, const uint8_t* source, int32_t y, PngTarg
   }
 }
 
-// Rows that come in order: straight into the picture, or through one row.
+// Rows that come in order: straight into the picture, or through one row. `done`: how many came.
 Status ReadInOrder(PngReader& reader, const PngLayout& layout, const PictureRecord& picture,
-                   PngTarget& target) {
+                   PngTarget& target, int32_t& done) {
   std::vector<uint8_t> row(png_get_rowbytes(reader.png, reader.info));
   Status status = Status::Ok;
   const bool read = PngGuarded(reader.png, [&] {
@@ -263,6 +270,7 @@ Status ReadInOrder(PngReader& reader, const PngLayout& layout, const PictureReco
       const bool direct = layout.rows == RowForm::Direct;
       png_read_row(reader.png, direct ? target.image.Row(y).data() : row.data(), nullptr);
       if (!direct) StoreRow(layout, row.data(), y, target);
+      done = y + 1;
       status = picture.ReportRow(y);
     }
   });
@@ -270,8 +278,9 @@ Status ReadInOrder(PngReader& reader, const PngLayout& layout, const PictureReco
 }
 
 // Interlaced rows come in seven passes, each of which fills in pixels, so all of them must be held.
+// `done`: 1 once pixels are there, which stand for rows.
 Status ReadInterlaced(PngReader& reader, const PngLayout& layout, const PictureRecord& picture,
-                      PngTarget& target) {
+                      PngTarget& target, int32_t& done) {
   const uint64_t rowBytes = png_get_rowbytes(reader.png, reader.info);
   platform::MemoryBlock buffer;
   if (layout.rows != RowForm::Direct &&
@@ -288,17 +297,17 @@ Status ReadInterlaced(PngReader& reader, const PngLayout& layout, const PictureR
     for (int pass = 0; pass < kPasses; ++pass) {
       for (int32_t y = 0; y < layout.height && status == Status::Ok; ++y) {
         png_read_row(reader.png, rowAt(y), nullptr);
+        done = 1;
         status = picture.ReportRow(layout.height / kPasses * pass);
       }
     }
   });
-  if (!read) return reader.Failure();
   RETURN_IF_BAD(status);
   for (int32_t y = 0; y < layout.height; ++y) {
     if (!buffer.Empty()) StoreRow(layout, rowAt(y), y, target);
     RETURN_IF_BAD(picture.ReportRow(y));
   }
-  return Status::Ok;
+  return read ? Status::Ok : reader.Failure();
 }
 
 // How a whole row of the file, free of its filter, becomes the picture's.
@@ -409,7 +418,8 @@ bool ReadAtOnce(const PngReader& reader, const PngLayout& layout, const PictureR
   return true;
 }
 
-Status ReadPixels(PngReader& reader, const PngLayout& layout, PictureRecord& picture) {
+Status ReadPixels(PngReader& reader, const PngLayout& layout, bool partial,
+                  PictureRecord& picture) {
   PngTarget target;
   const bool withAlpha = layout.rows == RowForm::WithAlpha;
   const uint64_t pixels =
@@ -422,8 +432,10 @@ Status ReadPixels(PngReader& reader, const PngLayout& layout, PictureRecord& pic
   if (!ReadAtOnce(reader, layout, picture, limits.fileMemoryBytes - held, target)) {
     // Only now: the library takes memory for rows of whatever width the file claims.
     if (!PngGuarded(reader.png, [&] { SetConversions(reader, layout); })) return reader.Failure();
-    RETURN_IF_BAD(layout.interlaced ? ReadInterlaced(reader, layout, picture, target)
-                                    : ReadInOrder(reader, layout, picture, target));
+    int32_t rows = 0;
+    const Status status = layout.interlaced ? ReadInterlaced(reader, layout, picture, target, rows)
+                                            : ReadInOrder(reader, layout, picture, target, rows);
+    RETURN_IF_BAD(TakePart(picture, partial, status, rows));
   }
   picture.image = std::move(target.image);
   picture.alpha = std::move(target.alpha);
@@ -506,12 +518,12 @@ Status DescribePng(std::span<const uint8_t> file, const ReadOptions& options,
   return Describe(reader, file, layout, options, picture);
 }
 
-Status DecodePng(std::span<const uint8_t> file, const ReadOptions& options,
-                 PictureRecord& picture) {
+Status DecodePng(std::span<const uint8_t> file, const ReadOptions& options, PictureRecord& picture,
+                 bool partial) {
   PngReader reader(file);
   PngLayout layout;
   RETURN_IF_BAD(Describe(reader, file, layout, options, picture));
-  return ReadPixels(reader, layout, picture);
+  return ReadPixels(reader, layout, partial, picture);
 }
 
 Status PngInfo(PictureRecord& picture, const ReadRequest& request) {
@@ -522,14 +534,73 @@ Status PngInfo(PictureRecord& picture, const ReadRequest& request) {
   return DescribePng(file.Bytes(), request.options, picture);
 }
 
+namespace {
+
+// A copy of a file that ends within pixels: the chunk that is cut short is as long as it goes, so
+// that the decoder gets all of it.
+std::vector<uint8_t> Mended(std::span<const uint8_t> file) {
+  std::vector<uint8_t> mended;
+  PngWalk walk(file);
+  for (PngPlace chunk; walk.Next(chunk);) {
+    if (chunk.End() <= file.size()) continue;
+    if (chunk.type != "IDAT" || chunk.data >= file.size()) break;
+    mended.assign(file.begin(), file.end());
+    const auto put = [&](size_t at, uint64_t value) {
+      for (size_t i = 0; i < 4; ++i) mended[at + i] = static_cast<uint8_t>(value >> (24 - 8 * i));
+    };
+    put(chunk.data - 8, file.size() - chunk.data);
+    const auto summed = std::span<const uint8_t>(mended).subspan(chunk.data - 4);
+    const uint32_t crc = libdeflate_crc32(0, summed.data(), summed.size());
+    mended.resize(mended.size() + 4);
+    put(mended.size() - 4, crc);
+    break;
+  }
+  return mended;
+}
+
+// Puts a frame of an animation in the place of the picture.
+Status ReadFrame(const ReadRequest& request, PictureRecord& picture) {
+  picture.image.Free();
+  picture.alpha.Free();
+  AnimationPointer animation;
+  RETURN_IF_BAD(PngAnimate(request, animation));
+  for (int32_t i = 0; i <= request.page; ++i) {
+    RETURN_IF_BAD(animation->Next());
+    RETURN_IF_BAD(picture.ReportRow(i, request.page + 1));
+  }
+  const Rectangle all{0, 0, picture.width, picture.height};
+  PackedImage image, alpha;
+  RETURN_IF_BAD(CutImage(animation->Frame().image, all, image));
+  if (!IsOpaque(animation->Frame().alpha))
+    RETURN_IF_BAD(CutImage(animation->Frame().alpha, all, alpha));
+  picture.bitsPerPixel = 24;
+  MakeDefaultPalette(&picture.palette, nullptr, kDisplayPalette);
+  picture.image = std::move(image);
+  picture.alpha = std::move(alpha);
+  return Status::Ok;
+}
+
+}  // namespace
+
 Status PngRead(PictureRecord& picture, const ReadRequest& request) {
   const ProgressScope progress(picture);
   picture.image.Free();
   picture.alpha.Free();
   platform::FileView file;
   if (!file.Open(request.fileName)) return Status::FileOpenError;
-  RETURN_IF_BAD(DecodePng(file.Bytes(), request.options, picture));
-  picture.simplified = picture.simplified || HoldsFurtherTexts(file.Bytes());
+  Status status = DecodePng(file.Bytes(), request.options, picture);
+  if (request.partial && status == Status::FileReadError) {
+    const std::vector<uint8_t> mended = Mended(file.Bytes());
+    if (!mended.empty()) status = DecodePng(mended, request.options, picture, true);
+  } else if (request.partial && status == Status::DamagedFile) {
+    status = DecodePng(file.Bytes(), request.options, picture, true);
+  }
+  RETURN_IF_BAD(status);
+  if (request.page > 0 && picture.pageCount > 1) return ReadFrame(request, picture);
+  if (HoldsFurtherTexts(file.Bytes())) {
+    picture.simplified = true;
+    picture.unread |= kUnreadTexts;
+  }
   return Status::Ok;
 }
 

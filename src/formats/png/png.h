@@ -3,8 +3,10 @@
 #include <span>
 
 #include "core/byte_writer.h"
+#include "picture/animation.h"
 #include "picture/picture_record.h"
 #include "picture/read_request.h"
+#include "picture/sequence.h"
 #include "picture/write_options.h"
 
 namespace fotomill {
@@ -15,13 +17,18 @@ Status PngInfo(PictureRecord& picture, const ReadRequest& request);
 Status PngRead(PictureRecord& picture, const ReadRequest& request);
 // Also ErrorCreatingFile (10), ErrorWritingFile (11).
 Status PngWrite(PictureRecord& picture, const WriteOptions& options);
+// The frames of an animation (APNG).
+Status PngAnimate(const ReadRequest& request, AnimationPointer& animation);
+Status PngSequenceBegin(const std::string& path, const SequenceFacts& facts,
+                        const WriteOptions& options, SequencePointer& sequence);
 Status PngDetails(PictureRecord& picture);
 
 // The same for a file that lies in memory, as containers hold them. Statuses as above.
 Status DescribePng(std::span<const uint8_t> file, const ReadOptions& options,
                    PictureRecord& picture);
-// A PNG file in memory: facts and pixels at once.
-Status DecodePng(std::span<const uint8_t> file, const ReadOptions& options, PictureRecord& picture);
+// A PNG file in memory: facts and pixels at once; `partial` as in a read request.
+Status DecodePng(std::span<const uint8_t> file, const ReadOptions& options, PictureRecord& picture,
+                 bool partial = false);
 // Appends a PNG file of the picture's pixels, without metadata, to `out`.
 Status EncodePng(const PictureRecord& picture, const EncodeOptions& options, ByteWriter& out);
 

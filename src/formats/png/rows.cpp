@@ -4,6 +4,7 @@
 #include <png.h>
 #include <zlib.h>
 
+#include "containers/bare_file.h"
 #include "formats/png/png.h"
 #include "texts/texts.h"
 
@@ -39,10 +40,13 @@ constexpr FormatEntry kRows[] = {{
     .enabled = 1,
     .flags = FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_PAGES | FMT_FRAMES | FMT_PNG |
              FMT_LAYERED | FMT_TRANSPARENT | FMT_SAVE_ANYWAY | FMT_ALPHA,
+    .animate = PngAnimate,
     .canRead = true,
     .canWrite = true,
     .signatures = kSignatures,
     .keepsMetadata = kAllMetadata,
+    .bare = MakeBarePng,
+    .sequence = PngSequenceBegin,
     .hasOptionsBox = true,
     .settings = &kSettings,
     .libraries = kLibraries,

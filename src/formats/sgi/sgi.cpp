@@ -87,6 +87,8 @@ void DescribePicture(const SgiHeader& header, PictureRecord& picture) {
   picture.alphaFlags =
       static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (header.Alpha() ? kHasAlpha : 0));
   picture.simplified = header.sampleSize > 1 || header.channels > 4;
+  picture.unread = static_cast<uint8_t>((header.sampleSize > 1 ? kUnreadDepth : 0) |
+                                        (header.channels > 4 ? kUnreadInks : 0));
   if (header.channels == 1) {
     picture.palette = GrayRamp();
   } else {

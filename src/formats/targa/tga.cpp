@@ -34,6 +34,7 @@
 
 #include "core/byte_reader.h"
 #include "core/byte_writer.h"
+#include "picture/partial.h"
 #include "platform/file_view.h"
 
 namespace fotomill {
@@ -291,13 +292,15 @@ void MirrorRow(std::span<uint8_t> row, int32_t width, size_t pixelSize) {
   }
 }
 
+// `done`: how many rows were read.
 Status ReadRows(ByteReader& bytes, platform::FileView& file, const TgaHeader& header,
                 const ColorMap& map, const PictureRecord& picture, PackedImage& image,
-                PackedImage& alpha) {
+                PackedImage& alpha, int32_t& done) {
   const RowReader readRow = ChooseRowReader(header);
   const size_t pixelSize = image.Bits() == 8 ? 1 : 3;
   RowSource source(bytes, header);
   for (int32_t r = 0; r < header.height; ++r) {
+    done = r;
     const auto raw = source.Next();
     if (raw.empty()) return Status::FileReadError;
     const int32_t stored = (header.descriptor & kFromTop) != 0 ? header.height - 1 - r : r;
@@ -391,6 +394,28 @@ void WriteRow(const PictureRecord& picture, int32_t r, const TgaLayout& layout,
   }
 }
 
+// Whether the attribute is alpha, as far as that can be told quickly: where no pixel is opaque, it
+// is not. A file whose first pixels have none is taken at its word.
+bool ShowsOpacity(std::span<const uint8_t> file, const TgaHeader& header, const ColorMap& map) {
+  constexpr uint64_t kMostPixels = 1 << 18;
+  if (AttributeIsUseless(file)) return false;
+  ByteReader bytes(file);
+  bytes.Seek(header.PixelOffset());
+  const RowReader readRow = ChooseRowReader(header);
+  RowSource source(bytes, header);
+  const auto width = static_cast<size_t>(header.width);
+  std::vector<uint8_t> row(3 * width), alpha(width);
+  uint64_t pixels = 0;
+  for (int32_t r = 0; r < header.height; ++r, pixels += width) {
+    if (pixels > kMostPixels) return true;
+    const auto raw = source.Next();
+    if (raw.empty()) return false;
+    readRow(raw, header.width, map, row, alpha);
+    if (std::ranges::any_of(alpha, [](uint8_t value) { return value != 0; })) return true;
+  }
+  return false;
+}
+
 // Reads what precedes the pixels, and fills in the picture's facts.
 Status TakeHead(std::span<const uint8_t> file, TgaHeader& header, ColorMap& map,
                 PictureRecord& picture) {
@@ -410,7 +435,13 @@ Status TgaInfo(PictureRecord& picture, const ReadRequest& request) {
   picture.fileSize = file.FileSize();
   TgaHeader header;
   ColorMap map;
-  return TakeHead(file.Bytes(), header, map, picture);
+  RETURN_IF_BAD(TakeHead(file.Bytes(), header, map, picture));
+  if (!header.HasAttribute()) return Status::Ok;
+  platform::FileView whole;
+  if (!whole.Open(request.fileName)) return Status::FileOpenError;
+  if (!ShowsOpacity(whole.Bytes(), header, map))
+    picture.alphaFlags &= static_cast<uint8_t>(~kHasAlpha);
+  return Status::Ok;
 }
 
 Status TgaRead(PictureRecord& picture, const ReadRequest& request) {
@@ -429,13 +460,16 @@ Status TgaRead(PictureRecord& picture, const ReadRequest& request) {
       static_cast<uint64_t>(header.width) * static_cast<uint64_t>(header.height);
   const uint64_t least =
       header.runLength ? pixels / 128 * (1 + header.PixelSize()) : pixels * header.PixelSize();
-  if (!bytes.Ok() || bytes.Left() < least) return Status::FileReadError;
+  const bool mayBeWhole = bytes.Ok() && bytes.Left() >= least;
+  if (!mayBeWhole && !request.partial) return Status::FileReadError;
   PackedImage image, alpha;
   RETURN_IF_BAD(NewPackedImage(header.width, header.height, &picture.palette, picture.bitsPerPixel, image));
   if (header.HasAttribute() && !AttributeIsUseless(file.Bytes())) {
     RETURN_IF_BAD(NewAlphaPlane(header.width, header.height, alpha));
   }
-  RETURN_IF_BAD(ReadRows(bytes, file, header, map, picture, image, alpha));
+  int32_t rows = 0;
+  const Status status = ReadRows(bytes, file, header, map, picture, image, alpha, rows);
+  RETURN_IF_BAD(TakePart(picture, request.partial, status, rows));
   if (!alpha.Empty() && !AnyOpacity(alpha)) alpha.Free();
   picture.image = std::move(image);
   picture.alpha = std::move(alpha);

@@ -2,6 +2,7 @@
 
 #include <tiffio.h>
 
+#include "containers/bare_file.h"
 #include "formats/tiff/tiff.h"
 #include "texts/texts.h"
 
@@ -43,7 +44,10 @@ constexpr FormatEntry kRows[] = {{
     .canRead = true,
     .canWrite = true,
     .signatures = kSignatures,
-    .keepsMetadata = kAllMetadata,
+    .keepsMetadata = kAllMetadata & ~kLostMakerNote,
+    .bare = MakeBareTiff,
+    .bareKeepsOrientation = true,
+    .sequence = TiffSequenceBegin,
     .hasOptionsBox = true,
     .settings = &kSettings,
     .libraries = kLibraries,

@@ -37,6 +37,7 @@
 #include "formats/tiff/tiff_lzw.h"
 #include "formats/tiff/tiff_samples.h"
 #include "picture/gray_palette.h"
+#include "picture/partial.h"
 #include "platform/file_view.h"
 #include "processing/pixel_rows.h"
 
@@ -230,6 +231,13 @@ void TakeMetadata(const TiffInput& input, PictureRecord& picture) {
   metadata.dpiY = y * perInch;
 }
 
+bool HoldsIptc(TIFF* tiff) {
+  uint32_t size = 0;
+  void* data = nullptr;
+  return TIFFGetField(tiff, TIFFTAG_RICHTIFFIPTC, &size, &data) != 0 ||
+         TIFFGetField(tiff, TIFFTAG_PHOTOSHOP, &size, &data) != 0;
+}
+
 // Whether there are tags of weight that a new file would not have: captions, places on the earth,
 // and without a camera's directory those of the author.
 bool HoldsFurtherTags(TIFF* tiff) {
@@ -296,6 +304,10 @@ Status Describe(TiffInput& input, int32_t page, TiffLayout& layout, PictureRecor
   picture.bitsPerPixel = layout.bitsPerPixel;
   picture.simplified = layout.form.bits > 8 || layout.colors > 3 ||
                        layout.photometric >= PHOTOMETRIC_CIELAB || HoldsFurtherTags(tiff);
+  const bool inks = layout.colors > 3 || layout.photometric >= PHOTOMETRIC_CIELAB;
+  picture.unread =
+      static_cast<uint8_t>((layout.form.bits > 8 ? kUnreadDepth : 0) | (inks ? kUnreadInks : 0) |
+                           (HoldsIptc(tiff) ? kUnreadIptc : 0));
   picture.alphaFlags =
       static_cast<uint8_t>((picture.alphaFlags & ~kHasAlpha) | (layout.alpha >= 0 ? kHasAlpha : 0));
   picture.imageBytes = EstimateImageBytes(picture.width, picture.height, picture.bitsPerPixel);
@@ -465,8 +477,9 @@ bool ReadPlainStrips(TiffInput& input, const TiffLayout& layout, const PictureRe
   return true;
 }
 
+// `done`: how many rows came.
 Status ReadScanlines(TiffInput& input, const TiffLayout& layout, const PictureRecord& picture,
-                     TiffConverter& converter) {
+                     TiffConverter& converter, uint32_t& done) {
   TIFF* tiff = input.Handle();
   const uint64_t rowBytes = (uint64_t{layout.width} * layout.form.bits * layout.samples + 7) / 8;
   const uint64_t given = TIFFScanlineSize64(tiff);
@@ -475,6 +488,7 @@ Status ReadScanlines(TiffInput& input, const TiffLayout& layout, const PictureRe
   for (uint32_t y = 0; y < layout.height; ++y) {
     if (TIFFReadScanline(tiff, row.data(), y, 0) < 0) return input.Failure();
     converter.Store(static_cast<int32_t>(y), row.data(), 0);
+    done = y + 1;
     RETURN_IF_BAD(picture.ReportRow(static_cast<int32_t>(y)));
   }
   return Status::Ok;
@@ -546,14 +560,16 @@ class TiffBand {
   platform::MemoryBlock bytes_, piece_;
 };
 
+// `done`: how many rows came.
 Status ReadBands(TiffInput& input, const TiffLayout& layout, const PictureRecord& picture,
-                 uint64_t held, TiffConverter& converter) {
+                 uint64_t held, TiffConverter& converter, uint32_t& done) {
   TiffBand band(input, layout);
   RETURN_IF_BAD(band.Allocate(held));
   for (uint32_t top = 0; top < layout.height; top += std::min(band.Rows(), layout.height - top)) {
     RETURN_IF_BAD(band.Fill(top));
     for (uint32_t r = 0; r < band.Rows() && top + r < layout.height; ++r) {
       converter.Store(static_cast<int32_t>(top + r), band.Row(r), band.PlaneStride());
+      done = top + r + 1;
       RETURN_IF_BAD(picture.ReportRow(static_cast<int32_t>(top + r)));
     }
   }
@@ -590,8 +606,9 @@ Status ReadThroughLibrary(TiffInput& input, const TiffLayout& layout, PictureRec
   return Status::Ok;
 }
 
-Status ReadPixels(TiffInput& input, const TiffLayout& layout, PictureRecord& picture) {
-  if (!FileHoldsPixels(input, layout)) return Status::FileReadError;
+Status ReadPixels(TiffInput& input, const TiffLayout& layout, bool partial,
+                  PictureRecord& picture) {
+  if (!partial && !FileHoldsPixels(input, layout)) return Status::FileReadError;
   if (layout.width > kMostRowSamples / layout.samples) return Status::MemoryAllocationError;
   TiffTarget target;
   const uint64_t pixels = uint64_t{layout.width} * layout.height;
@@ -605,11 +622,16 @@ Status ReadPixels(TiffInput& input, const TiffLayout& layout, PictureRecord& pic
     RETURN_IF_BAD(ReadThroughLibrary(input, layout, picture, target));
   } else {
     TiffConverter converter(layout, picture.palette, target);
-    const bool done = ReadPlainStrips(input, layout, picture, converter);
-    if (!done)
-      RETURN_IF_BAD(layout.tiled || layout.separate
-                        ? ReadBands(input, layout, picture, held, converter)
-                        : ReadScanlines(input, layout, picture, converter));
+    uint32_t rows = 0;
+    Status status = Status::Ok;
+    if (!ReadPlainStrips(input, layout, picture, converter)) {
+      // the library's old-style JPEG decoder gives whole strips only
+      const bool whole = layout.compression == COMPRESSION_OJPEG;
+      status = layout.tiled || layout.separate || whole
+                   ? ReadBands(input, layout, picture, held, converter, rows)
+                   : ReadScanlines(input, layout, picture, converter, rows);
+    }
+    RETURN_IF_BAD(TakePart(picture, partial, status, rows));
   }
   picture.image = std::move(target.image);
   picture.alpha = std::move(target.alpha);
@@ -676,7 +698,7 @@ Status TiffRead(PictureRecord& picture, const ReadRequest& request) {
   TiffLayout layout;
   RETURN_IF_BAD(Describe(input, request.page, layout, picture));
   input.Messages() = {};
-  const Status status = ReadPixels(input, layout, picture);
+  const Status status = ReadPixels(input, layout, request.partial, picture);
   if (status == Status::Ok && file.Intact()) {
     const TiffMessages& messages = input.Messages();
     picture.warning.AssignCut(messages.error);

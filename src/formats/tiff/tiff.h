@@ -2,6 +2,7 @@
 
 #include "picture/picture_record.h"
 #include "picture/read_request.h"
+#include "picture/sequence.h"
 #include "picture/write_options.h"
 
 namespace fotomill {
@@ -14,6 +15,9 @@ Status TiffInfo(PictureRecord& picture, const ReadRequest& request);
 Status TiffRead(PictureRecord& picture, const ReadRequest& request);
 // Also ErrorCreatingFile (10), ErrorWritingFile (11).
 Status TiffWrite(PictureRecord& picture, const WriteOptions& options);
+// A file of several pages.
+Status TiffSequenceBegin(const std::string& path, const SequenceFacts& facts,
+                         const WriteOptions& options, SequencePointer& sequence);
 Status TiffDetails(PictureRecord& picture);
 
 }  // namespace fotomill

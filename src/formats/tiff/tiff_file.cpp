@@ -6,11 +6,14 @@
 #include <memory>
 #include <string_view>
 
+#include "core/byte_reader.h"
 #include "core/limits.h"
 
 namespace fotomill {
 
 namespace {
+
+constexpr uint64_t kPlaceOfFirst = 4;  // where the head names the first directory
 
 TiffMessages& MessagesOf(void* user) { return *static_cast<TiffMessages*>(user); }
 
@@ -161,8 +164,16 @@ bool TiffOutput::Open() {
   return tiff_ != nullptr;
 }
 
+// The file's head names the directory, which begins with the number of its entries.
+void TiffOutput::NoteDirectory(std::span<const uint8_t> bytes) {
+  ByteReader reader(bytes);
+  if (position_ == kPlaceOfFirst && bytes.size() == 4) directory_ = reader.Le32();
+  if (directory_ != 0 && position_ == directory_) entries_ = reader.Le16();
+}
+
 tmsize_t TiffOutput::Write(const void* source, tmsize_t count) {
   std::span<const uint8_t> bytes(static_cast<const uint8_t*>(source), static_cast<size_t>(count));
+  NoteDirectory(bytes);
   if (position_ > out_.Position()) out_.Zeros(position_ - out_.Position());
   const auto inside = std::min<uint64_t>(bytes.size(), out_.Position() - position_);
   out_.Patch(position_, bytes.first(inside));

@@ -64,13 +64,19 @@ class TiffOutput {
   // Bytes that the file has; and more of them, which the library knows nothing of.
   uint64_t End() const { return out_.Position(); }
   void Append(std::span<const uint8_t> bytes) { out_.Bytes(bytes); }
+  // Of the directory that was written: its place, and where in it the place of the next one stands.
+  uint32_t Directory() const { return directory_; }
+  uint32_t NextPlace() const { return directory_ + 2 + 12 * entries_; }
 
   tmsize_t Write(const void* source, tmsize_t count);
   uint64_t Seek(uint64_t offset, int from);
 
  private:
+  void NoteDirectory(std::span<const uint8_t> bytes);
+
   ByteWriter& out_;
   uint64_t position_ = 0;
+  uint32_t directory_ = 0, entries_ = 0;
   TIFF* tiff_ = nullptr;
   TiffMessages messages_;
 };

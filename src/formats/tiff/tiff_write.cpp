@@ -1,10 +1,11 @@
-// The TIFF writer: one page, little-endian, in strips compressed as TiffOptions says. Palettes of
+// The TIFF writer: little-endian, in strips compressed as TiffOptions says. Palettes of
 // 1, 4 and 8 bits keep their depth (grays as gray), colors are RGB, with an alpha plane as a
 // separate extra sample. CCITT group 4 takes black and white pictures, JPEG grays of 8 bits and
 // colors without alpha; LZW takes the rest. Resolution is the picture's, else TiffResolution. An
 // EXIF block is spread over the file's directories; a thumbnail in it stays behind, as it would be
 // a page.
 #include <algorithm>
+#include <memory>
 #include <span>
 #include <string>
 #include <vector>
@@ -259,9 +260,8 @@ Status WriteLzwStrips(TIFF* tiff, const PictureRecord& picture, const TiffPlan& 
   return Status::Ok;
 }
 
-Status WriteAll(ByteWriter& out, PictureRecord& picture, const WriteOptions& options) {
-  TiffOutput output(out);
-  if (!output.Open()) return Status::MemoryAllocationError;
+// A directory with its picture; further ones may follow.
+Status WritePage(TiffOutput& output, PictureRecord& picture, const WriteOptions& options) {
   TIFF* tiff = output.Handle();
   const TiffPlan plan = MakePlan(picture, options.encode.tiffCompression);
   SetLayout(tiff, picture, plan, options.encode.jpegQuality);
@@ -273,6 +273,47 @@ Status WriteAll(ByteWriter& out, PictureRecord& picture, const WriteOptions& opt
   return TIFFWriteDirectory(tiff) != 0 ? Status::Ok : Status::ErrorWritingFile;
 }
 
+// The library reads back what it wrote to find the last page, which a file in the making does not
+// allow. So each page is written as the only one of its file, and the pages are linked here.
+class TiffSequence final : public SequenceWriter {
+ public:
+  TiffSequence(const SequenceFacts& facts, const WriteOptions& options)
+      : facts_(facts), options_(options) {}
+  Status Create(const std::string& path) {
+    return out_.Create(path) ? Status::Ok : Status::ErrorCreatingFile;
+  }
+
+  Status Add(PictureRecord& picture, int32_t) override {
+    if (picture.image.Empty()) return Status::EmptyImage;
+    TiffOutput output(out_);
+    if (!output.Open()) return Status::MemoryAllocationError;
+    const auto count = static_cast<uint16_t>(std::min<size_t>(facts_.count, UINT16_MAX));
+    TIFFSetField(output.Handle(), TIFFTAG_SUBFILETYPE, FILETYPE_PAGE);
+    TIFFSetField(output.Handle(), TIFFTAG_PAGENUMBER, page_++, count);
+    RETURN_IF_BAD(WritePage(output, picture, options_));
+    if (out_.Position() > UINT32_MAX) return Status::UnsuitableImage;
+    if (first_ == 0) first_ = output.Directory();
+    if (next_ != 0) out_.PatchLe32(next_, output.Directory());
+    next_ = output.NextPlace();
+    return Status::Ok;
+  }
+
+  Status Finish() override {
+    if (first_ == 0) return Status::EmptyImage;
+    out_.PatchLe32(kFirstPlace, first_);
+    return CommitOutput(out_, options_);
+  }
+
+ private:
+  static constexpr uint64_t kFirstPlace = 4;  // in the file's head
+
+  const SequenceFacts facts_;
+  const WriteOptions options_;
+  ByteWriter out_;
+  uint32_t first_ = 0, next_ = 0;  // where the first directory is, and the last one names its next
+  uint16_t page_ = 0;
+};
+
 }  // namespace
 
 Status TiffWrite(PictureRecord& picture, const WriteOptions& options) {
@@ -280,8 +321,20 @@ Status TiffWrite(PictureRecord& picture, const WriteOptions& options) {
   if (picture.image.Empty()) return Status::MemoryAllocationError;
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
-  RETURN_IF_BAD(WriteAll(out, picture, options));
+  {
+    TiffOutput output(out);
+    if (!output.Open()) return Status::MemoryAllocationError;
+    RETURN_IF_BAD(WritePage(output, picture, options));
+  }
   return CommitOutput(out, options);
+}
+
+Status TiffSequenceBegin(const std::string& path, const SequenceFacts& facts,
+                         const WriteOptions& options, SequencePointer& sequence) {
+  auto made = std::make_unique<TiffSequence>(facts, options);
+  RETURN_IF_BAD(made->Create(path));
+  sequence = std::move(made);
+  return Status::Ok;
 }
 
 }  // namespace fotomill

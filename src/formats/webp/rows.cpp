@@ -3,6 +3,7 @@
 #include <webp/decode.h>
 #include <webp/encode.h>
 
+#include "containers/bare_file.h"
 #include "formats/webp/webp.h"
 #include "texts/texts.h"
 
@@ -43,7 +44,9 @@ constexpr FormatEntry kRows[] = {{
     .canRead = true,
     .canWrite = true,
     .signatures = kSignatures,
-    .keepsMetadata = kAllMetadata,
+    .keepsMetadata = kAllMetadata & ~(kLostComment | kLostGrayIcc),
+    .bare = MakeBareWebp,
+    .sequence = WebpSequenceBegin,
     .hasOptionsBox = true,
     .settings = &kSettings,
     .libraries = kLibraries,

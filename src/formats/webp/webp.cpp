@@ -17,7 +17,6 @@
 #include "formats/webp/webp.h"
 
 #include <webp/decode.h>
-#include <webp/encode.h>
 
 #include <algorithm>
 #include <cstring>
@@ -30,6 +29,7 @@
 #include "core/byte_reader.h"
 #include "core/byte_writer.h"
 #include "core/limits.h"
+#include "picture/partial.h"
 #include "platform/file_view.h"
 
 namespace fotomill {
@@ -269,6 +269,39 @@ Status ReadOpaque(const WebpFile& file, const PictureRecord& picture, Canvas& ta
   return Status::Ok;
 }
 
+struct IncrementalDeleter {
+  void operator()(WebPIDecoder* decoder) const { WebPIDelete(decoder); }
+};
+
+// The rows of a still picture that ends early, straight into the canvas. `rows`: how many.
+Status ReadPart(const WebpFile& file, Canvas& target, int32_t& rows) {
+  const WebpFrame& frame = file.frames[0];
+  const size_t stride = 4 * static_cast<size_t>(frame.width);
+  const size_t size = stride * static_cast<size_t>(frame.height);
+  RETURN_IF_BAD(CheckFileMemory(target.image.Bytes().size() + target.alpha.Bytes().size() + size +
+                                DecoderBytes(frame)));
+  platform::MemoryBlock decoded;
+  if (!decoded.Allocate(size)) return Status::MemoryAllocationError;
+  const std::unique_ptr<WebPIDecoder, IncrementalDeleter> decoder(
+      WebPINewRGB(MODE_BGRA, decoded.Data(), size, static_cast<int>(stride)));
+  if (decoder == nullptr) return Status::MemoryAllocationError;
+  const VP8StatusCode code = WebPIUpdate(decoder.get(), frame.pixels.data(), frame.pixels.size());
+  if (code == VP8_STATUS_OUT_OF_MEMORY) return Status::MemoryAllocationError;
+  int last = 0;
+  if (WebPIDecGetRGB(decoder.get(), &last, nullptr, nullptr, nullptr) == nullptr) last = 0;
+  rows = last;
+  for (int32_t y = 0; y < rows; ++y) {
+    const uint8_t* source = decoded.Data() + stride * static_cast<size_t>(y);
+    uint8_t* colors = target.image.Row(y).data();
+    uint8_t* alpha = target.alpha.Empty() ? nullptr : target.alpha.Row(y).data();
+    for (int32_t x = 0; x < frame.width; ++x, source += 4, colors += 3) {
+      std::memcpy(colors, source, 3);
+      if (alpha != nullptr) alpha[x] = source[3];
+    }
+  }
+  return StatusOf(code);
+}
+
 class WebpAnimation final : public Animation {
  public:
   Status Open(const std::string& fileName) {
@@ -288,114 +321,6 @@ class WebpAnimation final : public Animation {
 
   platform::FileView view_;
   WebpFile file_;  // views into the file
-};
-
-struct PictureDeleter {
-  void operator()(WebPPicture* picture) const { WebPPictureFree(picture); }
-};
-
-// The color of each pixel as blue, green, red, alpha.
-void FillRow(const PictureRecord& picture, int32_t y, uint32_t* target) {
-  const PackedImage& image = picture.image;
-  const uint8_t* row = image.Row(y).data();
-  const bool color = image.Bits() == 24;
-  const auto table = image.ColorTable();
-  for (int32_t x = 0; x < image.Width(); ++x, ++target) {
-    const uint8_t* pixel = color ? row + 3 * static_cast<size_t>(x)
-                                 : &table[4 * static_cast<size_t>(image.PixelAt(x, y))];
-    const uint32_t alpha =
-        picture.alpha.Empty() ? 255 : picture.alpha.Row(y)[static_cast<size_t>(x)];
-    *target = alpha << 24 | static_cast<uint32_t>(pixel[2] << 16 | pixel[1] << 8 | pixel[0]);
-  }
-}
-
-// What the encoder holds for a pixel, at most: measured on noise, which takes the most.
-constexpr uint64_t kLosslessBytes = 32, kLossyBytes = 17, kLossyLeastBytes = 8;
-
-// Refuses what takes too much memory. Lossy encoding has a way that takes longer and less.
-Status ChooseMemory(const PictureRecord& picture, WebPConfig& config) {
-  const uint64_t pixels =
-      static_cast<uint64_t>(picture.image.Width()) * static_cast<uint64_t>(picture.image.Height());
-  const uint64_t held = picture.image.Bytes().size() + picture.alpha.Bytes().size();
-  if (config.lossless != 0) return CheckFileMemory(held + kLosslessBytes * pixels);
-  config.low_memory = CheckFileMemory(held + kLossyBytes * pixels) == Status::Ok ? 0 : 1;
-  return CheckFileMemory(held + kLossyLeastBytes * pixels);
-}
-
-Status Encode(const PictureRecord& picture, bool lossless, int32_t factor,
-              WebPMemoryWriter& encoded) {
-  WebPConfig config;
-  WebPPicture source;
-  const auto quality = static_cast<float>(std::clamp<int32_t>(factor, 0, 100));
-  if (WebPConfigPreset(&config, WEBP_PRESET_DEFAULT, quality) == 0 || WebPPictureInit(&source) == 0)
-    return Status::ResourceError;
-  config.lossless = lossless ? 1 : 0;
-  config.exact = lossless ? 1 : 0;
-  RETURN_IF_BAD(ChooseMemory(picture, config));
-  source.use_argb = 1;
-  source.width = picture.image.Width();
-  source.height = picture.image.Height();
-  source.writer = WebPMemoryWrite;
-  source.custom_ptr = &encoded;
-  source.user_data = const_cast<PictureRecord*>(&picture);
-  source.progress_hook = [](int, const WebPPicture* asked) {
-    return static_cast<const PictureRecord*>(asked->user_data)->stop.Asked() ? 0 : 1;
-  };
-  if (WebPPictureAlloc(&source) == 0) return Status::MemoryAllocationError;
-  const std::unique_ptr<WebPPicture, PictureDeleter> owner(&source);
-  for (int32_t y = 0; y < source.height; ++y) {
-    FillRow(picture, y, source.argb + static_cast<ptrdiff_t>(source.argb_stride) * y);
-    RETURN_IF_BAD(picture.ReportRow(y));
-  }
-  if (WebPEncode(&config, &source) != 0) return Status::Ok;
-  if (source.error_code == VP8_ENC_ERROR_USER_ABORT) return Status::FunctionCancelled;
-  const bool memory = source.error_code == VP8_ENC_ERROR_OUT_OF_MEMORY ||
-                      source.error_code == VP8_ENC_ERROR_BITSTREAM_OUT_OF_MEMORY;
-  return memory ? Status::MemoryAllocationError : Status::ErrorWritingFile;
-}
-
-void WriteChunk(ByteWriter& out, std::string_view name, std::span<const uint8_t> data) {
-  if (data.empty()) return;
-  out.Text(name);
-  out.Le32(static_cast<uint32_t>(data.size()));
-  out.Bytes(data);
-  out.Zeros(data.size() % 2);
-}
-
-uint64_t ChunkBytes(uint64_t data) { return data == 0 ? 0 : 8 + data + data % 2; }
-
-// The encoder's file, with the chunks of metadata around its pixels where there are any.
-void WriteFile(ByteWriter& out, const PictureRecord& picture, const PictureMetadata& metadata,
-               std::span<const uint8_t> encoded) {
-  const auto pixels = encoded.subspan(kRiffHead);
-  // lossy with alpha
-  const bool extended = pixels.size() >= 18 && std::memcmp(pixels.data(), "VP8X", 4) == 0;
-  const auto chunks = extended ? pixels.subspan(18) : pixels;
-  const uint64_t length = 4 + 18 + chunks.size() + ChunkBytes(metadata.icc.size()) +
-                          ChunkBytes(metadata.exif.size()) + ChunkBytes(metadata.xmp.size());
-  const auto side = [](int32_t value) { return static_cast<uint32_t>(value - 1); };
-  out.Text("RIFF");
-  out.Le32(static_cast<uint32_t>(length));
-  out.Text("WEBPVP8X");
-  out.Le32(10);
-  out.Le32((metadata.icc.empty() ? 0u : kIccFlag) | (metadata.exif.empty() ? 0u : kExifFlag) |
-           (metadata.xmp.empty() ? 0u : kXmpFlag) | (picture.alpha.Empty() ? 0u : kAlphaFlag));
-  for (const uint32_t value : {side(picture.image.Width()), side(picture.image.Height())}) {
-    out.Le16(static_cast<uint16_t>(value));
-    out.U8(static_cast<uint8_t>(value >> 16));
-  }
-  WriteChunk(out, "ICCP", metadata.icc);
-  out.Bytes(chunks);
-  WriteChunk(out, "EXIF", metadata.exif);
-  WriteChunk(out, "XMP ", metadata.xmp);
-}
-
-struct EncodedFile {
-  EncodedFile() { WebPMemoryWriterInit(&writer); }
-  ~EncodedFile() { WebPMemoryWriterClear(&writer); }
-  EncodedFile(const EncodedFile&) = delete;
-  EncodedFile& operator=(const EncodedFile&) = delete;
-  WebPMemoryWriter writer;
 };
 
 }  // namespace
@@ -428,7 +353,15 @@ Status WebpRead(PictureRecord& picture, const ReadRequest& request) {
   RETURN_IF_BAD(CheckFileMemory(canvas ? rows + rows / 3 : rows));
   RETURN_IF_BAD(NewPackedImage(file.width, file.height, &picture.palette, 24, target.image));
   if (canvas) RETURN_IF_BAD(NewAlphaPlane(file.width, file.height, target.alpha));
-  RETURN_IF_BAD(canvas ? ReadWithAlpha(file, request.page + 1, picture, target) : ReadOpaque(file, picture, target));
+  const Status status = canvas ? ReadWithAlpha(file, request.page + 1, picture, target)
+                               : ReadOpaque(file, picture, target);
+  if (request.partial && status != Status::Ok && file.frames.size() == 1) {
+    int32_t shown = 0;
+    const Status part = ReadPart(file, target, shown);
+    RETURN_IF_BAD(TakePart(picture, request.partial, part == Status::Ok ? status : part, shown));
+  } else {
+    RETURN_IF_BAD(status);
+  }
   if (!view.Intact()) return Status::FileReadError;
   if (canvas && !file.alpha) DropOpaqueAlpha(target);
   picture.image = std::move(target.image);
@@ -441,34 +374,6 @@ Status WebpAnimate(const ReadRequest& request, AnimationPointer& animation) {
   RETURN_IF_BAD(opened->Open(request.fileName));
   animation = std::move(opened);
   return Status::Ok;
-}
-
-Status WebpWrite(PictureRecord& picture, const WriteOptions& options) {
-  const ProgressScope progress(picture);
-  if (picture.image.Empty()) return Status::MemoryAllocationError;
-  ByteWriter out;
-  if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
-  const bool lossless = options.lossless || options.encode.webpLossless;
-  EncodedFile encoded, other;
-  const int32_t quality = options.encode.webpQuality;
-  RETURN_IF_BAD(Encode(picture, lossless, quality, encoded.writer));
-  if (!options.lossless && options.encode.webpMixed) {
-    const Status status = Encode(picture, !lossless, quality, other.writer);
-    if (status != Status::Ok && status != Status::MemoryAllocationError) return status;
-  }
-  const bool useOther = other.writer.size > 0 && other.writer.size < encoded.writer.size;
-  const WebPMemoryWriter& chosen = useOther ? other.writer : encoded.writer;
-  const std::span<const uint8_t> bytes(chosen.mem, chosen.size);
-  // the profile goes along whatever becomes of the rest
-  PictureMetadata kept;
-  if (options.KeepsMetadata()) kept = picture.metadata;
-  kept.icc = picture.metadata.icc;
-  if (!kept.Empty() && bytes.size() > kRiffHead) {
-    WriteFile(out, picture, kept, bytes);
-  } else {
-    out.Bytes(bytes);
-  }
-  return CommitOutput(out, options);
 }
 
 }  // namespace fotomill

@@ -3,6 +3,7 @@
 #include "picture/animation.h"
 #include "picture/picture_record.h"
 #include "picture/read_request.h"
+#include "picture/sequence.h"
 #include "picture/write_options.h"
 
 namespace fotomill {
@@ -15,5 +16,8 @@ Status WebpRead(PictureRecord& picture, const ReadRequest& request);
 Status WebpAnimate(const ReadRequest& request, AnimationPointer& animation);
 // Also ErrorCreatingFile (10), ErrorWritingFile (11).
 Status WebpWrite(PictureRecord& picture, const WriteOptions& options);
+// An animation.
+Status WebpSequenceBegin(const std::string& path, const SequenceFacts& facts,
+                         const WriteOptions& options, SequencePointer& sequence);
 
 }  // namespace fotomill

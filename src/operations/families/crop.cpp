@@ -91,6 +91,8 @@ Status Canvas(PictureRecord& picture, const Arguments& arguments, const Operatio
   return PlaceOnCanvas(picture, size, place.x, place.y, BackdropOf(arguments.Color("background")));
 }
 
+bool Always(const Arguments&) { return true; }
+
 constexpr Operation kOperations[] = {
     {.name = "crop",
      .family = Family::Crop,
@@ -99,7 +101,8 @@ constexpr Operation kOperations[] = {
      .example = "crop 3:2 gravity=top",
      .parameters = kCrop,
      .works = Works::Geometry,
-     .apply = Crop},
+     .apply = Crop,
+     .moves = Always},
     {.name = "trim",
      .family = Family::Crop,
      .label = "Trim",
@@ -107,7 +110,8 @@ constexpr Operation kOperations[] = {
      .example = "trim 10 margin=2",
      .parameters = kTrim,
      .works = Works::Geometry,
-     .apply = Trim},
+     .apply = Trim,
+     .moves = Always},
     {.name = "canvas",
      .family = Family::Crop,
      .label = "Canvas",
@@ -115,7 +119,8 @@ constexpr Operation kOperations[] = {
      .example = "canvas 200x200 gravity=top background=gray",
      .parameters = kCanvas,
      .works = Works::Geometry,
-     .apply = Canvas},
+     .apply = Canvas,
+     .moves = Always},
 };
 
 }  // namespace

@@ -314,6 +314,12 @@ Status Upright(PictureRecord& picture, const Arguments&, const OperationContext&
   return TurnUpright(picture);
 }
 
+bool Always(const Arguments&) { return true; }
+
+bool IsQuarterTurn(const Arguments& arguments) {
+  return std::fmod(arguments.Number("angle"), 90) == 0;
+}
+
 constexpr Operation kOperations[] = {
     {.name = "resize",
      .family = Family::Transform,
@@ -330,7 +336,8 @@ constexpr Operation kOperations[] = {
      .example = "rotate 7 background=black",
      .parameters = kRotate,
      .works = Works::Geometry,
-     .apply = Rotate},
+     .apply = Rotate,
+     .moves = IsQuarterTurn},
     {.name = "flip",
      .family = Family::Transform,
      .label = "Flip",
@@ -338,7 +345,8 @@ constexpr Operation kOperations[] = {
      .example = "flip vertical",
      .parameters = kFlip,
      .works = Works::Geometry,
-     .apply = Flip},
+     .apply = Flip,
+     .moves = Always},
     {.name = "upright",
      .family = Family::Transform,
      .label = "Upright",
@@ -346,7 +354,8 @@ constexpr Operation kOperations[] = {
      .example = "upright",
      .parameters = {},
      .works = Works::Geometry,
-     .apply = Upright},
+     .apply = Upright,
+     .moves = Always},
     {.name = "straighten",
      .family = Family::Transform,
      .label = "Straighten",
@@ -387,7 +396,8 @@ constexpr Operation kOperations[] = {
      .example = "offset 50% 0",
      .parameters = kOffset,
      .works = Works::Geometry,
-     .apply = Offset},
+     .apply = Offset,
+     .moves = Always},
 };
 
 }  // namespace

@@ -178,18 +178,21 @@ Status MakeFromPicture(const ThumbnailRequest& request, Thumbnail& thumbnail) {
   PicturePointer picture;
   const bool onFaces =
       InDatabase(request) ? request.options.onFaces : request.options.onFacesUnkept;
-  const ReadRequest read{.fileName = request.path,
-                         .thumbnailSide = onFaces ? std::max(request.side, kFramingSide) : request.side,
-                         .options = request.options.read};
+  const ReadRequest read{
+      .fileName = request.path,
+      .thumbnailSide = onFaces ? std::max(request.side, kFramingSide) : request.side,
+      .partial = true,
+      .options = request.options.read};
   RETURN_IF_BAD(LoadPictureInfo(read, picture));
   CopyFacts(*picture, thumbnail);
   RETURN_IF_BAD(ReadPicture(read, *picture));
+  thumbnail.partial = picture->shortfall != Status::Ok;
   thumbnail.alpha = !picture->alpha.Empty();
   if (onFaces)
     RETURN_IF_BAD(FrameOnFaces(*picture, request.options.faces, request.options.onAllFaces));
   RETURN_IF_BAD(PrepareForDisplay(*picture, request.options.matte));
   ThumbnailRecord record;
-  if (InDatabase(request) && request.options.keep &&
+  if (!thumbnail.partial && InDatabase(request) && request.options.keep &&
       MakeThumbnailRecord(record, *picture, request.options))
     openDatabase.Add(request, record);
   return ScaleDown(picture->image, request.side, thumbnail.pixels);

@@ -30,6 +30,7 @@ struct Thumbnail {
   RgbImage pixels;                                     // never larger than the square, nor enlarged
   int32_t width = 0, height = 0, bits = 0, pages = 1;  // of the picture, 0 when it was not opened
   bool alpha = false;
+  bool partial = false;   // the file ends early: the rest of the picture is missing
   bool animated = false;  // the pages are frames that follow each other
   // the thumbnail that the file itself holds, which nobody has compared with the picture
   bool standIn = false;

@@ -48,7 +48,7 @@ const ColorTransform& TransformOf(const std::vector<uint8_t>& profile) {
 
 Status LoadInto(const ViewRequest& request, ViewPicture& view) {
   PicturePointer picture;
-  ReadRequest read{.fileName = request.path, .options = request.read};
+  ReadRequest read{.fileName = request.path, .partial = true, .options = request.read};
   RETURN_IF_BAD(LoadPictureInfo(read, picture));
   read.page = request.page;
   RETURN_IF_BAD(ReadPicture(read, *picture));
@@ -147,6 +147,7 @@ ViewPicturePointer TurnedView(const ViewPicture& view, Orientation turn) {
   picture.formatIndex = old.formatIndex;
   picture.pageCount = old.pageCount;
   picture.page = old.page;
+  picture.shortfall = old.shortfall;
   return turned;
 }
 

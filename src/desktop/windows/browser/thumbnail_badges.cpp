@@ -39,11 +39,26 @@ void DrawCheckerboard(wxDC& dc, const wxWindow& window, const wxRect& picture) {
   dc.DrawRectangle(badge);
 }
 
+// For a picture of which a part is missing.
+void DrawMark(wxDC& dc, const wxWindow& window, const wxRect& picture, const wxColour& color,
+              const wxColour& textColor) {
+  const wxString mark("!");
+  const wxSize text = dc.GetTextExtent(mark);
+  const wxRect badge(picture.x, picture.y, text.x + 2 * window.FromDIP(5),
+                     text.y + window.FromDIP(2));
+  dc.SetPen(*wxTRANSPARENT_PEN);
+  dc.SetBrush(wxBrush(color));
+  dc.DrawRoundedRectangle(badge, window.FromDIP(3));
+  dc.SetTextForeground(textColor);
+  dc.DrawText(mark, badge.x + (badge.width - text.x) / 2, badge.y + (badge.height - text.y) / 2);
+}
+
 }  // namespace
 
 void DrawBadges(wxDC& dc, const wxWindow& window, const wxRect& picture, const Thumbnail& thumbnail,
                 const wxColour& color, const wxColour& textColor) {
   if (thumbnail.alpha) DrawCheckerboard(dc, window, picture);
+  if (thumbnail.partial) DrawMark(dc, window, picture, color, textColor);
   if (thumbnail.pages > 1) DrawPages(dc, window, picture, thumbnail, color, textColor);
 }
 

@@ -1,0 +1,265 @@
+// A TIFF file names everything by its place in the file, so nothing is moved: a directory keeps its
+// place with fewer entries, and what no entry leads to any more becomes zero.
+// Source: Adobe, "TIFF Revision 6.0" (1992); the libtiff project, "The BigTIFF Design".
+#include <algorithm>
+#include <unordered_set>
+
+#include "containers/bare_file.h"
+#include "core/byte_reader.h"
+#include "core/limits.h"
+
+namespace fotomill {
+
+namespace {
+
+// Tags that decide how a picture looks, how large it is, or that hold it: those of TIFF 6.0 but for
+// texts and dates, those of fax, tiles and JPEG, the color profile, and those that compressions of
+// later days need.
+struct TagRange {
+  uint32_t first, last;
+};
+constexpr TagRange kPicture[] = {
+    {254, 259},     {262, 266},     {273, 274},     {277, 284},     {286, 288},
+    {290, 293},     {296, 297},     {301, 301},     {317, 332},     {334, 334},
+    {336, 347},     {512, 521},     {529, 532},     {559, 559},     {32995, 32998},
+    {34675, 34675}, {34908, 34910}, {37439, 37439}, {50674, 50674},
+};
+constexpr uint32_t kStripOffsets = 273, kStripSizes = 279, kTileOffsets = 324, kTileSizes = 325;
+constexpr uint32_t kSubDirectories = 330, kJpegOffset = 513, kJpegSize = 514;
+// pointers to the tables of the first JPEG form: quantization, and two of Huffman codes
+constexpr uint32_t kFirstJpegTables = 519, kLastJpegTables = 521;
+constexpr uint64_t kMostJpegTable = 16 + 256;
+constexpr uint32_t kExif = 34665, kGps = 34853, kInteroperability = 40965;
+constexpr uint8_t kTypeBytes[] = {0, 1, 1, 2, 4, 8, 1, 1, 2, 4, 8, 4, 8, 4, 0, 0, 8, 8, 8};
+constexpr int32_t kDeepest = 4;            // directories within directories
+constexpr uint64_t kMostPieces = 1 << 23;  // strips and tiles of all pages
+
+bool BelongsToPicture(uint32_t tag) {
+  return std::ranges::any_of(
+      kPicture, [tag](const TagRange& range) { return tag >= range.first && tag <= range.last; });
+}
+
+// Bytes of the file, from `first` up to `end`.
+struct Range {
+  uint64_t first, end;
+};
+
+struct Entry {
+  uint32_t tag = 0, type = 0;
+  uint64_t count = 0;
+  uint64_t start = 0;            // of the entry itself
+  uint64_t value = 0, size = 0;  // where its values are
+  bool outside = false;          // of the entry
+};
+
+class BareTiff {
+ public:
+  BareTiff(std::span<const uint8_t> file, std::vector<uint8_t>& bare) : file_(file), bare_(bare) {}
+
+  Status Make() {
+    ByteReader head(file_);
+    bigEndian_ = head.Match("MM");
+    if (!bigEndian_ && !head.Match("II")) return Status::DamagedFile;
+    const uint64_t version = Number(2, 2);
+    if (version != 42 && version != 43) return Status::DamagedFile;
+    wide_ = version == 43;
+    bare_.assign(file_.begin(), file_.end());
+    const uint64_t first = wide_ ? 8 : 4;
+    Keep(0, first + Word());
+    RETURN_IF_BAD(TakeChain(Number(first, Word()), 0));
+    Erase();
+    return Status::Ok;
+  }
+
+ private:
+  uint64_t Word() const { return wide_ ? 8 : 4; }
+  uint64_t EntryBytes() const { return wide_ ? 20 : 12; }
+  uint64_t CountBytes() const { return wide_ ? 8 : 2; }
+
+  bool Holds(uint64_t at, uint64_t size) const {
+    return at <= file_.size() && size <= file_.size() - at;
+  }
+  // A number of the file; 0 where it does not hold it.
+  uint64_t Number(uint64_t at, uint64_t size) const {
+    uint64_t number = 0;
+    if (!Holds(at, size)) return 0;
+    for (uint64_t i = 0; i < size; ++i)
+      number = number << 8 | file_[at + (bigEndian_ ? i : size - 1 - i)];
+    return number;
+  }
+  void Keep(uint64_t at, uint64_t size) { kept_.push_back({at, at + size}); }
+  void Drop(uint64_t at, uint64_t size) { dropped_.push_back({at, at + size}); }
+
+  // The directories from `at` on, each leading to the next.
+  Status TakeChain(uint64_t at, int32_t depth) {
+    while (at != 0) {
+      if (!visited_.insert(at).second || visited_.size() > limits.filePages)
+        return Status::DamagedFile;
+      RETURN_IF_BAD(TakeDirectory(at, depth));
+      at = Number(next_, Word());
+    }
+    return Status::Ok;
+  }
+
+  // Reads the entries of a directory; `next_` is behind them.
+  Status ReadEntries(uint64_t at, std::vector<Entry>& entries) {
+    const uint64_t count = Number(at, CountBytes());
+    if (!Holds(at, CountBytes())) return Status::FileReadError;
+    if (count > limits.exifEntries - read_ || !Holds(at + CountBytes(), count * EntryBytes()))
+      return Status::DamagedFile;
+    read_ += count;
+    for (uint64_t i = 0; i < count; ++i) {
+      Entry entry{.start = at + CountBytes() + i * EntryBytes()};
+      entry.tag = static_cast<uint32_t>(Number(entry.start, 2));
+      entry.type = static_cast<uint32_t>(Number(entry.start + 2, 2));
+      entry.count = Number(entry.start + 4, Word());
+      entry.value = entry.start + 4 + Word();
+      const uint64_t each = entry.type < std::size(kTypeBytes) ? kTypeBytes[entry.type] : 0;
+      if (each != 0 && entry.count > file_.size() / each) return Status::DamagedFile;
+      entry.size = each * entry.count;
+      entry.outside = entry.size > Word();
+      if (entry.outside) entry.value = Number(entry.value, Word());
+      entries.push_back(entry);
+    }
+    next_ = at + CountBytes() + count * EntryBytes();
+    return Status::Ok;
+  }
+
+  Status TakeDirectory(uint64_t at, int32_t depth) {
+    std::vector<Entry> entries;
+    RETURN_IF_BAD(ReadEntries(at, entries));
+    if (!Holds(next_, Word())) return Status::FileReadError;
+    const uint64_t end = next_, following = Number(next_, Word());
+    uint64_t target = at + CountBytes();  // of the next entry that stays
+    for (const Entry& entry : entries) {
+      if (!BelongsToPicture(entry.tag)) {
+        DropEntry(entry, 0);
+        continue;
+      }
+      if (entry.outside && !Holds(entry.value, entry.size)) return Status::DamagedFile;
+      if (entry.outside) Keep(entry.value, entry.size);
+      std::copy_n(file_.begin() + static_cast<ptrdiff_t>(entry.start), EntryBytes(),
+                  bare_.begin() + static_cast<ptrdiff_t>(target));
+      target += EntryBytes();
+    }
+    RETURN_IF_BAD(KeepData(entries));
+    PutNumber(at, (target - at) / EntryBytes(), CountBytes());
+    PutNumber(target, following, Word());
+    Keep(at, target + Word() - at);
+    Drop(target + Word(), end - target);
+    RETURN_IF_BAD(TakeSubDirectories(entries, depth));
+    next_ = end;
+    return Status::Ok;
+  }
+
+  void PutNumber(uint64_t at, uint64_t number, uint64_t size) {
+    for (uint64_t i = 0; i < size; ++i)
+      bare_[at + (bigEndian_ ? size - 1 - i : i)] = static_cast<uint8_t>(number >> 8 * i);
+  }
+
+  // Its values, and those of the directory that it leads to.
+  void DropEntry(const Entry& entry, int32_t depth) {
+    if (entry.outside && Holds(entry.value, entry.size)) Drop(entry.value, entry.size);
+    const bool pointer = entry.tag == kExif || entry.tag == kGps || entry.tag == kInteroperability;
+    const uint64_t at = Number(entry.value, entry.size);
+    if (!pointer || entry.outside || at == 0 || depth >= kDeepest) return;
+    if (!visited_.insert(at).second) return;
+    std::vector<Entry> entries;
+    if (ReadEntries(at, entries) != Status::Ok) return;
+    Drop(at, CountBytes() + entries.size() * EntryBytes() + Word());
+    for (const Entry& inner : entries) DropEntry(inner, depth + 1);
+  }
+
+  uint64_t NumberOf(const Entry& entry, uint64_t i) const {
+    const uint64_t each = kTypeBytes[entry.type];
+    return each > 8 ? 0 : Number(entry.value + i * each, each);
+  }
+
+  // The pieces of the picture. Those beyond the file are no matter of ours. UnsupportedFormat when
+  // there are absurdly many.
+  Status KeepData(const std::vector<Entry>& entries) {
+    const auto find = [&](uint32_t tag) {
+      const auto found = std::ranges::find(entries, tag, &Entry::tag);
+      return found == entries.end() || found->size == 0 ? nullptr : &*found;
+    };
+    for (const auto& [offsets, sizes] : {std::pair(find(kStripOffsets), find(kStripSizes)),
+                                         std::pair(find(kTileOffsets), find(kTileSizes)),
+                                         std::pair(find(kJpegOffset), find(kJpegSize))}) {
+      if (offsets == nullptr) continue;
+      pieces_ += offsets->count;
+      if (pieces_ > kMostPieces) return Status::UnsupportedFormat;
+      for (uint64_t i = 0; i < offsets->count; ++i) {
+        const uint64_t at = NumberOf(*offsets, i);
+        // without a size: up to the end
+        const bool sized = sizes != nullptr && i < sizes->count;
+        const uint64_t size = sized ? NumberOf(*sizes, i) : file_.size();
+        if (at < file_.size()) Keep(at, std::min(size, file_.size() - at));
+      }
+    }
+    for (const Entry& entry : entries) {
+      if (entry.tag < kFirstJpegTables || entry.tag > kLastJpegTables || entry.size == 0) continue;
+      for (uint64_t i = 0; i < entry.count; ++i) {
+        const uint64_t at = NumberOf(entry, i);
+        if (at < file_.size()) Keep(at, std::min(kMostJpegTable, file_.size() - at));
+      }
+    }
+    return Status::Ok;
+  }
+
+  Status TakeSubDirectories(const std::vector<Entry>& entries, int32_t depth) {
+    for (const Entry& entry : entries) {
+      if (entry.tag != kSubDirectories || entry.size == 0) continue;
+      if (depth >= kDeepest) return Status::DamagedFile;
+      for (uint64_t i = 0; i < entry.count; ++i)
+        RETURN_IF_BAD(TakeChain(NumberOf(entry, i), depth + 1));
+    }
+    return Status::Ok;
+  }
+
+  // In order, without overlaps.
+  static void Merge(std::vector<Range>& ranges) {
+    std::ranges::sort(ranges, {}, &Range::first);
+    size_t last = 0;
+    for (const Range& range : ranges) {
+      if (range.first <= ranges[last].end) {
+        ranges[last].end = std::max(ranges[last].end, range.end);
+      } else {
+        ranges[++last] = range;
+      }
+    }
+    if (!ranges.empty()) ranges.resize(last + 1);
+  }
+
+  // Puts zeros where something was dropped and nothing is kept, and cuts off the end.
+  void Erase() {
+    Merge(kept_);
+    Merge(dropped_);
+    auto next = kept_.begin();  // the first one that ends behind the place in work
+    for (const Range& range : dropped_) {
+      for (uint64_t at = range.first; at < range.end;) {
+        while (next != kept_.end() && next->end <= at) ++next;
+        const uint64_t end = next == kept_.end() ? range.end : std::min(range.end, next->first);
+        for (; at < end; ++at) bare_[at] = 0;
+        if (next != kept_.end() && at >= next->first) at = next->end;
+      }
+    }
+    if (!kept_.empty() && kept_.back().end < bare_.size()) bare_.resize(kept_.back().end);
+  }
+
+  const std::span<const uint8_t> file_;
+  std::vector<uint8_t>& bare_;
+  bool bigEndian_ = false, wide_ = false;
+  uint64_t next_ = 0;    // behind the entries of the directory read last
+  uint64_t read_ = 0;    // entries so far
+  uint64_t pieces_ = 0;  // of pixels
+  std::unordered_set<uint64_t> visited_;
+  std::vector<Range> kept_, dropped_;
+};
+
+}  // namespace
+
+Status MakeBareTiff(std::span<const uint8_t> file, std::vector<uint8_t>& bare) {
+  return BareTiff(file, bare).Make();
+}
+
+}  // namespace fotomill
