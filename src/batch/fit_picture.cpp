@@ -34,14 +34,15 @@ bool SuitsPixels(const PictureRecord& picture, const FormatEntry& row) {
 }
 
 // Brings the colors from the picture's profile to another one; empty: sRGB.
-void ConvertColors(PictureRecord& picture, std::span<const uint8_t> target) {
+Status ConvertColors(PictureRecord& picture, std::span<const uint8_t> target) {
   const ColorTransform transform(picture.metadata.icc, target);
-  if (!transform.ChangesColors()) return;
-  transform.Apply(picture.image);
+  if (!transform.ChangesColors()) return Status::Ok;
+  RETURN_IF_BAD(transform.Apply(picture.image, picture.stop));
   const auto table = picture.image.ColorTable();
   for (size_t i = 0; i < table.size() / 4; ++i) {
     for (size_t c = 0; c < 3; ++c) picture.palette[3 * i + c] = table[4 * i + 2 - c];
   }
+  return Status::Ok;
 }
 
 Status FitOrientation(PictureRecord& picture, bool keepsTag) {
@@ -58,7 +59,7 @@ Status GiveProfile(PictureRecord& picture, const FormatEntry& row,
     return Status::UnsuitableImage;
   }
   if (IsGray(picture)) RETURN_IF_BAD(PromotePicture(picture));
-  ConvertColors(picture, profile);
+  RETURN_IF_BAD(ConvertColors(picture, profile));
   picture.metadata.icc = profile;
   return Status::Ok;
 }
@@ -77,7 +78,7 @@ Status FitPicture(PictureRecord& picture, const FormatEntry& row, const FitReque
   if (picture.metadata.icc.empty()) return Status::Ok;
   const bool keep = request.profile.use == ProfileRequest::Use::Keep;
   if (keep && HoldsProfile(row) && SuitsPixels(picture, row)) return Status::Ok;
-  ConvertColors(picture, {});
+  RETURN_IF_BAD(ConvertColors(picture, {}));
   picture.metadata.icc.clear();
   return Status::Ok;
 }

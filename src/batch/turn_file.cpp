@@ -82,12 +82,16 @@ class Turning {
     return status;
   }
 
+  ReadRequest Reading(const std::string& file) const {
+    return {.fileName = file, .stop = request_.stop, .options = read_};
+  }
+
   Status Turn() {
     if (source_ == destination_ && !request_.dryRun && !held_.Hold(source_))
       return Fail(Status::ErrorCreatingFile, ReasonSentence());
     stamp_ = source_ == destination_ ? held_.Stamp() : platform::StampOf(source_);
     PicturePointer picture;
-    if (const Status status = LoadPictureInfo({.fileName = source_, .options = read_}, picture);
+    if (const Status status = LoadPictureInfo(Reading(source_), picture);
         status != Status::Ok) {
       return Fail(status, OpenHint(source_, status));
     }
@@ -108,6 +112,7 @@ class Turning {
     const JpegTurnRequest request{.turn = request_.turn,
                                   .seenByExif = request_.seenByExif,
                                   .trim = request_.trim,
+                                  .stop = request_.stop,
                                   .encode = options_.encode};
     if (const Status status = MakeTurnedJpeg(file.Bytes(), request, made, turned);
         status != Status::Ok) {
@@ -137,7 +142,7 @@ class Turning {
     if (std::string obstacle = Obstacle(*picture); !obstacle.empty())
       return Fail(Status::UnsuitableImage, std::move(obstacle));
     RETURN_IF_BAD(CheckMemory(*picture));
-    RETURN_IF_BAD(ReadPicture({.fileName = source_, .options = read_}, *picture));
+    RETURN_IF_BAD(ReadPicture(Reading(source_), *picture));
     if (std::string obstacle = Obstacle(*picture); !obstacle.empty())
       return Fail(Status::UnsuitableImage, std::move(obstacle));
     const Orientation told = OrientationOf(*picture);
@@ -149,6 +154,7 @@ class Turning {
       return WriteUnlessThere(file.Bytes(), true);
     }
     RETURN_IF_BAD(TurnPicture(*picture, turn));
+    if (request_.stop.Asked()) return Status::FunctionCancelled;
     return WriteDecoded(*picture);
   }
 
@@ -164,7 +170,7 @@ class Turning {
     plain.comment = options_.comment;
     RETURN_IF_BAD(WritePictureAs(picture, working.Path(), picture.formatIndex, plain));
     PicturePointer back;
-    RETURN_IF_BAD(LoadPicture({.fileName = working.Path(), .options = read_}, back));
+    RETURN_IF_BAD(LoadPicture(Reading(working.Path()), back));
     const PictureMetadata& metadata = picture.metadata;
     const bool kept = metadata.exif.empty() == back->metadata.exif.empty() &&
                       metadata.xmp == back->metadata.xmp && metadata.icc == back->metadata.icc;

@@ -3,6 +3,7 @@
 #include <string>
 
 #include "core/status.h"
+#include "core/workers/stop_token.h"
 #include "picture/read_request.h"
 #include "picture/write_options.h"
 #include "processing/geometry/orient.h"
@@ -10,7 +11,7 @@
 
 namespace fotomill {
 
-// How pictures are to be turned.
+// How to turn pictures.
 struct TurnRequest {
   Orientation turn = Orientation::Upright;  // of the picture as it is seen
   bool seenByExif = true;                   // the EXIF orientation is applied first
@@ -18,6 +19,7 @@ struct TurnRequest {
   bool trim = false;
   bool keepTime = false;                    // the new file has the time of the old one
   bool dryRun = false;                      // nothing is written; the result is that of a run
+  StopToken stop = {};                      // ends the work with FunctionCancelled (4)
 };
 
 // The result for one file.

@@ -134,8 +134,9 @@ class TurnBatch {
       turned = {.status = Status::ErrorCreatingFile,
                 .hint = WithReason(Tr("The folder \"%1\" does not exist.", folder))};
     } else {
-      turned = TurnPictureFile(outcome.source, outcome.destination, function_.request, job_.read,
-                               options);
+      TurnRequest request = function_.request;
+      request.stop = job_.stop.Token();
+      turned = TurnPictureFile(outcome.source, outcome.destination, request, job_.read, options);
     }
     if (turned.changed && function_.inPlace && function_.replaced)
       function_.replaced(outcome.source);

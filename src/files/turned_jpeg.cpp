@@ -16,7 +16,7 @@ namespace {
 Status TurnThumbnail(std::span<const uint8_t> bytes, Orientation orientation,
                      const EncodeOptions& encode, std::vector<uint8_t>& made) {
   TurnedJpeg turned;
-  if (TurnJpeg(bytes, orientation, false, turned) == Status::Ok && !turned.file.empty()) {
+  if (TurnJpeg(bytes, orientation, false, {}, turned) == Status::Ok && !turned.file.empty()) {
     JpegHead head;
     RETURN_IF_BAD(ParseJpegHead(bytes, head));
     return AssembleJpeg(bytes, head, {.pixels = turned.file, .swapSides = SwapsSides(orientation)},
@@ -75,7 +75,7 @@ class TurnedFile {
     } else if (head_.HasSplitExif()) {
       turned.obstacle = TrRecorded("The EXIF block is too large for one segment.");
     } else {
-      return TurnJpeg(file_, wanted, request_.trim, turned);
+      return TurnJpeg(file_, wanted, request_.trim, request_.stop, turned);
     }
     return Status::Ok;
   }

@@ -6,18 +6,20 @@
 #include <vector>
 
 #include "core/status.h"
+#include "core/workers/stop_token.h"
 #include "picture/encode_options.h"
 #include "processing/geometry/orient.h"
 #include "texts/texts.h"
 
 namespace fotomill {
 
-// How the picture is to be turned.
+// How to turn the picture.
 struct JpegTurnRequest {
   Orientation turn = Orientation::Upright;  // of the picture as it is seen
   // it is seen as its EXIF orientation says; otherwise as its pixels are stored
   bool seenByExif = true;
   bool trim = false;                        // cut off edges that cannot be turned without loss
+  StopToken stop = {};                      // ends the work with FunctionCancelled (4)
   // of the thumbnail inside, where that cannot be turned without loss
   EncodeOptions encode = {};
 };

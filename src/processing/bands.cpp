@@ -8,7 +8,9 @@ namespace fotomill {
 
 namespace {
 
-constexpr int32_t kBandsACore = 4;  // so that Abort is seen in time and cores finish together
+// So that Abort is seen in time and cores finish together. One core alone has more bands, but
+// larger ones than they could be: what two of them need is computed twice.
+constexpr int32_t kBandsACore = 4, kBandsAlone = 16, kLeastAlone = 4;
 
 }  // namespace
 
@@ -16,7 +18,9 @@ Status ForBands(int32_t rows, int32_t least, const Work& work, const BandFunctio
   if (rows <= 0) return Status::Ok;
   const auto cores =
       work.threads == 1 ? 1 : static_cast<int32_t>(std::min(WorkerPool::Shared().Cores(), 64u));
-  const int32_t height = std::clamp(std::max(least, rows / (cores * kBandsACore)), 1, rows);
+  const int32_t wanted = cores == 1 ? std::max(kLeastAlone * least, rows / kBandsAlone)
+                                    : std::max(least, rows / (cores * kBandsACore));
+  const int32_t height = std::clamp(wanted, 1, rows);
   const auto part = [&](int32_t number) {
     if (!work.GoesOn()) return Status::FunctionCancelled;
     const int32_t first = number * height;

@@ -80,6 +80,22 @@ TEST(Turn, FilesChangeOnlyWhereNothingIsLost) {
   }
 }
 
+TEST(Turn, StopsWithinAFile) {
+  const TemporaryFolder folder;
+  const PicturePointer picture = PatternPicture(32, 16, 24);
+  const StopSource stop;
+  stop.Stop();
+  for (const auto& [name, bytes] : {std::pair{"a.jpg", Encode(JpegWrite, *picture)},
+                                    {"b.png", Encode(PngWrite, *picture)}}) {
+    SCOPED_TRACE(name);
+    const std::string path = folder.Path(name);
+    WriteBytes(path, bytes);
+    const TurnRequest request{.turn = Orientation::HalfTurn, .stop = stop.Token()};
+    EXPECT_EQ(TurnPictureFile(path, path, request, {}, {}).status, Status::FunctionCancelled);
+    EXPECT_EQ(ReadBytes(path), bytes);
+  }
+}
+
 TEST(Turn, AFileThatWouldLoseItsTextsStaysAsItIs) {
   const ScopedSettings scoped;
   const TemporaryFolder folder;

@@ -76,6 +76,28 @@ TEST(Hdp, DamagedDataNeverEndTheProgram) {
   EXPECT_GT(failures, 0);
 }
 
+// Stops the work as soon as rows come back.
+class Stopping : public ProgressSink {
+ public:
+  void Step(int32_t, int32_t) override { source.Stop(); }
+  StopSource source;
+};
+
+TEST(Hdp, TheChildProcessStopsWithItsJob) {
+  if (!HdpWorksHere()) GTEST_SKIP() << "libjxr is not installed";
+  const TemporaryFolder folder;
+  const std::string path = folder.Path("large.hdp");
+  WriteBytes(path, Encode(HdpWrite, *PatternPicture(3000, 2000, 24)));
+  Stopping progress;
+  const PicturePointer picture = NewPictureRecord();
+  picture->progress = &progress;
+  picture->stop = progress.source.Token();
+  EXPECT_EQ(HdpRead(*picture, {.fileName = path}), Status::FunctionCancelled);
+  EXPECT_TRUE(picture->image.Empty());
+  progress.source.Stop();
+  EXPECT_EQ(HdpRead(*picture, {.fileName = path}), Status::FunctionCancelled);
+}
+
 TEST(Hdp, ColorsThatWereMultipliedByAlphaAreDividedAgain) {
   if (!HdpWorksHere()) GTEST_SKIP() << "libjxr is not installed";
   std::vector<uint8_t> file = ReadBytes(SourcePath("tests/formats/hdp/good/alpha-multiplied.wdp"));

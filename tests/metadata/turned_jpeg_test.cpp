@@ -166,6 +166,11 @@ TEST(TurnedJpeg, UnfitFilesKeepTheirPixels) {
   EXPECT_EQ(MakeTurnedJpeg(std::span(sound).first(sound.size() - 500), request, made, result), Status::FileReadError);
   EXPECT_EQ(MakeTurnedJpeg(Hex("FFD8FFD9"), request, made, result), Status::DamagedFile);
   EXPECT_TRUE(made.empty());
+  const StopSource stop;
+  stop.Stop();
+  EXPECT_EQ(MakeTurnedJpeg(sound, {.turn = Orientation::HalfTurn, .stop = stop.Token()}, made, result),
+            Status::FunctionCancelled);
+  EXPECT_TRUE(made.empty());
 }
 
 TEST(TurnedJpeg, AnOrientationIsAddedInTheOrderOfTheTags) {

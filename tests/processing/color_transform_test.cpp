@@ -57,13 +57,24 @@ std::array<double, 3> WideInSrgb(uint32_t color) {
           Encoded(0.0556434 * x - 0.2040259 * y + 1.0572252 * z)};
 }
 
+TEST(ColorTransform, CanBeStopped) {
+  const StopSource stop;
+  const auto picture = test::MakePicture(
+      900, 900, [](int32_t x, int32_t y) { return test::Scatter(x, y) & 0xffffff; });
+  const std::vector<uint32_t> before = test::Colors(*picture);
+  stop.Stop();
+  EXPECT_EQ(ColorTransform(WideProfile()).Apply(picture->image, stop.Token()),
+            Status::FunctionCancelled);
+  EXPECT_EQ(test::Colors(*picture), before);
+}
+
 TEST(ColorTransform, BringsWideColorsToTheScreen) {
   const ColorTransform transform(WideProfile());
   ASSERT_TRUE(transform.ChangesColors());
   const auto picture = test::MakePicture(
       1031, 1021, [](int32_t x, int32_t y) { return test::Scatter(x, y) & 0xffffff; });
   const std::vector<uint32_t> before = test::Colors(*picture);
-  transform.Apply(picture->image);
+  ASSERT_EQ(transform.Apply(picture->image), Status::Ok);
   const std::vector<uint32_t> after = test::Colors(*picture);
   for (size_t i = 0; i < before.size(); ++i) {
     const auto wanted = WideInSrgb(before[i]);
@@ -74,7 +85,7 @@ TEST(ColorTransform, BringsWideColorsToTheScreen) {
   PackedImage small;
   ASSERT_EQ(NewPackedImage(1, 1, nullptr, 4, small), Status::Ok);
   small.ColorTable()[1] = 200;
-  transform.Apply(small);
+  ASSERT_EQ(transform.Apply(small), Status::Ok);
   EXPECT_NEAR(small.ColorTable()[1], WideInSrgb(0x00c800)[1], 1);
   // On a screen of the same colors nothing is to be done; on it, pictures without a profile are
   // those of sRGB.
@@ -82,7 +93,7 @@ TEST(ColorTransform, BringsWideColorsToTheScreen) {
   PackedImage green;
   ASSERT_EQ(NewPackedImage(1, 1, nullptr, 24, green), Status::Ok);
   green.Row(0)[1] = 255;
-  ColorTransform({}, WideProfile()).Apply(green);
+  ASSERT_EQ(ColorTransform({}, WideProfile()).Apply(green), Status::Ok);
   EXPECT_NEAR(green.Row(0)[2], 144, 1);  // the red of sRGB's green in Adobe RGB
 }
 
@@ -91,12 +102,12 @@ TEST(ColorTransform, GrayProfilesAreForGrayPictures) {
   ASSERT_TRUE(transform.ChangesColors());
   const auto picture = test::MakePicture(
       256, 1, [](int32_t x, int32_t) { return static_cast<uint32_t>(x) * 0x10101; });
-  transform.Apply(picture->image);
+  ASSERT_EQ(transform.Apply(picture->image), Status::Ok);
   for (int32_t x = 0; x < 256; ++x)
     EXPECT_NEAR(picture->image.PixelAt(x, 0) & 255, Encoded(x / 255.0), 1) << x;
   const auto colored =
       test::MakePicture(2, 1, [](int32_t x, int32_t) { return x == 0 ? 0x404040u : 0x404041u; });
-  transform.Apply(colored->image);
+  ASSERT_EQ(transform.Apply(colored->image), Status::Ok);
   EXPECT_EQ(colored->image.PixelAt(0, 0), 0x404040);
 }
 
@@ -144,12 +155,12 @@ TEST(ColorTransform, HostileProfilesDoNoHarm) {
   const auto picture =
       test::MakePicture(4, 4, [](int32_t x, int32_t y) { return test::Scatter(x, y) & 0xffffff; });
   for (size_t cut = 0; cut < wide.size(); cut += 7)
-    ColorTransform({wide.data(), cut}).Apply(picture->image);
+    ASSERT_EQ(ColorTransform({wide.data(), cut}).Apply(picture->image), Status::Ok);
   for (size_t place = 0; place < wide.size(); place += 3) {
     std::vector<uint8_t> damaged = wide;
     damaged[place] = static_cast<uint8_t>(damaged[place] ^ (place % 2 == 0 ? 0xff : 0x55));
-    ColorTransform(damaged, wide).Apply(picture->image);
-    ColorTransform(wide, damaged).Apply(picture->image);
+    ASSERT_EQ(ColorTransform(damaged, wide).Apply(picture->image), Status::Ok);
+    ASSERT_EQ(ColorTransform(wide, damaged).Apply(picture->image), Status::Ok);
   }
 }
 

@@ -338,7 +338,8 @@ Status HdpRead(PictureRecord& picture, const ReadRequest& request) {
   RETURN_IF_BAD(Describe(file.Bytes(), request.page, page, picture));
   RETURN_IF_BAD(CheckPackedSize(picture.width, picture.height, picture.bitsPerPixel));
   HdpRaster raster;
-  RETURN_IF_BAD(DecodeHdp(page, raster, [&](int32_t rows) { (void)picture.ReportRow(rows); }));
+  RETURN_IF_BAD(DecodeHdp(page, raster, picture.stop,
+                          [&](int32_t rows) { (void)picture.ReportRow(rows); }));
   if (!file.Intact()) return Status::FileReadError;
   HdpTarget target;
   RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette, picture.bitsPerPixel, target.image));

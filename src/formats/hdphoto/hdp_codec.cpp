@@ -146,7 +146,7 @@ SampleShape ShapeOf(const HdpStream& stream) {
   }
 }
 
-// What the process apart is asked for: the sizes of the codestreams, which are its input one behind
+// The request to the child process: the sizes of the codestreams, which are its input one behind
 // the other, and the raster.
 struct DecodeRequest {
   // bytes; without alphaSize, alpha comes with the colors if there is any
@@ -232,7 +232,8 @@ bool HasHdpLibrary() { return Library().Whole(); }
 
 bool CanDecodeHdp(const HdpStream& stream) { return ShapeOf(stream).samples > 0; }
 
-Status DecodeHdp(const HdpPage& page, HdpRaster& raster, const std::function<void(int32_t)>& told) {
+Status DecodeHdp(const HdpPage& page, HdpRaster& raster, const StopToken& stop,
+                 const std::function<void(int32_t)>& told) {
   if (!CanDecodeHdp(page.image)) return Status::UnsupportedFormat;
   if (page.cutShort) return Status::FileReadError;
   if (!HasHdpLibrary()) return Status::FeatureDisabled;
@@ -258,7 +259,8 @@ Status DecodeHdp(const HdpPage& page, HdpRaster& raster, const std::function<voi
        .request = {reinterpret_cast<const uint8_t*>(&request), sizeof request},
        .input = input.Bytes(),
        .reply = raster.block,
-       .seconds = kSecondsAtLeast + static_cast<unsigned>(pixels / kPixelsPerSecond)},
+       .seconds = kSecondsAtLeast + static_cast<unsigned>(pixels / kPixelsPerSecond),
+       .goesOn = [&] { return !stop.Asked(); }},
       told);
   const bool overrun = raster.block.Bytes().back() != 0;
   switch (result) {

@@ -6,6 +6,7 @@
 
 #include "core/byte_writer.h"
 #include "core/status.h"
+#include "core/workers/stop_token.h"
 #include "formats/hdphoto/hdp_file.h"
 #include "picture/packed_image.h"
 #include "platform/work_apart.h"
@@ -36,9 +37,10 @@ bool CanDecodeHdp(const HdpStream& stream);
 // Decodes a page. The library trusts what it reads, so it works apart: a fault in the data that
 // brings it down is DamagedFile like any other. FileReadError when the data end too early,
 // FeatureDisabled without the library, UnsupportedFormat for colors that CanDecodeHdp refuses,
-// MemoryAllocationError, FunctionCancelled when the program was asked to end meanwhile. `told`
-// receives finished rows.
-Status DecodeHdp(const HdpPage& page, HdpRaster& raster, const std::function<void(int32_t)>& told);
+// MemoryAllocationError, FunctionCancelled when `stop` was asked meanwhile. `told` receives
+// finished rows.
+Status DecodeHdp(const HdpPage& page, HdpRaster& raster, const StopToken& stop,
+                 const std::function<void(int32_t)>& told);
 
 // The part of it that runs apart: a row of the program's table of such work.
 bool DecodeHdpApart(const platform::ApartCall& call);

@@ -66,6 +66,7 @@ struct JpegTurner {
   JpegReader reader;
   JpegErrors errors;  // of writing
   jpeg_compress_struct info = {};
+  jpeg_progress_mgr monitor = {};  // of writing, which the reader's token stops too
   unsigned char* bytes = nullptr;
   unsigned long size = 0;
   JDIMENSION width = 0, height = 0;  // of the old picture, as far as it is kept
@@ -190,7 +191,7 @@ void TurnBlocks(JpegTurner& turner, const Plane& plane, Turn turn, const BlockTu
   const auto source = [](bool flip, JDIMENSION place, JDIMENSION count) {
     return flip ? count - 1 - place : place;
   };
-  for (JDIMENSION y = 0; y < plane.height; ++y) {
+  for (JDIMENSION y = 0; y < plane.height && !turner.reader.stop.Asked(); ++y) {
     JBLOCKROW target = toRow(y);
     if (!turn.swap) {
       const JBLOCKROW row = fromRow(source(turn.flipY, y, plane.fromHeight));
@@ -204,12 +205,20 @@ void TurnBlocks(JpegTurner& turner, const Plane& plane, Turn turn, const BlockTu
   }
 }
 
+void WatchWriting(j_common_ptr common) {
+  if (static_cast<const JpegReader*>(common->client_data)->stop.Asked())
+    common->err->error_exit(common);
+}
+
 Status WriteTurned(JpegTurner& turner, Turn turn) {
   const BlockTurn block(turn);
   const bool written = Guarded(turner.errors, [&] {
     // its blocks are asked for here, and fail into here
     turner.reader.info.err = &turner.errors.base;
     jpeg_create_compress(&turner.info);
+    turner.monitor.progress_monitor = WatchWriting;
+    turner.info.progress = &turner.monitor;
+    turner.info.client_data = &turner.reader;
     jpeg_mem_dest(&turner.info, &turner.bytes, &turner.size);
     SetPictureForm(turner, turn);
     RequestBlocks(turner);
@@ -220,6 +229,7 @@ Status WriteTurned(JpegTurner& turner, Turn turn) {
       TurnBlocks(turner, turner.planes[static_cast<size_t>(i)], turn, block);
     jpeg_finish_compress(&turner.info);
   });
+  if (turner.reader.stop.Asked()) return Status::FunctionCancelled;
   if (written) return Status::Ok;
   const Status status =
       turner.errors.Meaning(static_cast<j_common_ptr>(static_cast<void*>(&turner.info)));
@@ -229,10 +239,11 @@ Status WriteTurned(JpegTurner& turner, Turn turn) {
 }  // namespace
 
 Status TurnJpeg(std::span<const uint8_t> file, Orientation orientation, bool trim,
-                TurnedJpeg& turned) {
+                const StopToken& stop, TurnedJpeg& turned) {
   turned = {};
   const Turn turn = TurnOf(orientation);
   JpegTurner turner;
+  turner.reader.stop = stop;
   RETURN_IF_BAD(ReadJpegHeader(turner.reader, file));
   Measure(turner, turn, trim, turned);
   LayOut(turner, turn);

@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "core/status.h"
+#include "core/workers/stop_token.h"
 #include "processing/geometry/orient.h"
 #include "texts/texts.h"
 
@@ -26,8 +27,9 @@ struct TurnedJpeg {
 // Turns the picture of a JPEG file. Edges move only in whole blocks (8 pixels, 16 where colors are
 // stored at half the size): where a side that changes its end has a rest, that is an obstacle; with
 // `trim` up to 15 rows or columns of pixels are cut off instead. Progressive pictures stay so. The
-// statuses are those of reading; FileReadError (3) for files cut short.
+// statuses are those of reading; FileReadError (3) for files cut short, FunctionCancelled (4) when
+// `stop` was asked meanwhile.
 Status TurnJpeg(std::span<const uint8_t> file, Orientation orientation, bool trim,
-                TurnedJpeg& turned);
+                const StopToken& stop, TurnedJpeg& turned);
 
 }  // namespace fotomill

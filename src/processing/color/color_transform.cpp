@@ -53,17 +53,18 @@ bool IsGray(const PackedImage& image) {
 }
 
 // Divides rows among the cores that are free, `work` gets a first one and the one behind the last.
-void ForBandsOfRows(int32_t rows, uint64_t pixels,
-                    const std::function<void(int32_t, int32_t)>& work) {
+Status ForBandsOfRows(int32_t rows, uint64_t pixels, const StopToken& stop,
+                      const std::function<void(int32_t, int32_t)>& work) {
   const auto bands = static_cast<int32_t>(
       std::clamp<uint64_t>(pixels / kPixelsPerBand, 1, static_cast<uint64_t>(rows)));
   const auto start = [&](int32_t band) {
     return static_cast<int32_t>(int64_t{rows} * band / bands);
   };
-  (void)ShareOut(bands, [&](int32_t band) {
+  const auto part = [&](int32_t band) {
     work(start(band), start(band + 1));
     return Status::Ok;
-  });
+  };
+  return ShareOut(bands, part, stop);
 }
 
 }  // namespace
@@ -85,14 +86,17 @@ ColorTransform::~ColorTransform() {
   if (transform_ != nullptr) cmsDeleteTransform(transform_);
 }
 
-void ColorTransform::Apply(PackedImage& image) const {
-  if (!ChangesColors() || image.Empty()) return;
-  if (image.Bits() != 24) return ApplyToColorTable(image);
-  if (gray_ && !IsGray(image)) return;
+Status ColorTransform::Apply(PackedImage& image, const StopToken& stop) const {
+  if (!ChangesColors() || image.Empty()) return Status::Ok;
+  if (image.Bits() != 24) {
+    ApplyToColorTable(image);
+    return Status::Ok;
+  }
+  if (gray_ && !IsGray(image)) return Status::Ok;
   const uint64_t pixels =
       static_cast<uint64_t>(image.Width()) * static_cast<uint64_t>(image.Height());
-  ForBandsOfRows(image.Height(), pixels,
-                 [&](int32_t first, int32_t end) { ApplyToRows(image, first, end); });
+  return ForBandsOfRows(image.Height(), pixels, stop,
+                        [&](int32_t first, int32_t end) { ApplyToRows(image, first, end); });
 }
 
 void ColorTransform::ApplyToColorTable(PackedImage& image) const {

@@ -4,6 +4,8 @@
 #include <cstdint>
 #include <span>
 
+#include "core/status.h"
+#include "core/workers/stop_token.h"
 #include "picture/packed_image.h"
 
 namespace fotomill {
@@ -23,8 +25,9 @@ class ColorTransform {
   bool ChangesColors() const { return transform_ != nullptr; }  // false: Apply does nothing
   // Changes the pixels of an image of 24 bits, or the color table of a smaller one; large images on
   // all cores. A picture in colors with the profile of a gray one stays as it is. Any number of
-  // threads may call this at once.
-  void Apply(PackedImage& image) const;
+  // threads may call this at once. FunctionCancelled (4) when `stop` was asked meanwhile: a part of
+  // the pixels is changed then.
+  Status Apply(PackedImage& image, const StopToken& stop = {}) const;
 
  private:
   static constexpr int32_t kGrays = 256;

@@ -75,7 +75,8 @@ Status PrepareView(PicturePointer picture, ViewPicture& view) {
   const ViewRequest& request = view.request;
   // Before the background joins in, whose color is the screen's.
   const bool profiles = !picture->metadata.icc.empty() || !screenProfile.empty();
-  if (request.look.profiles && profiles) TransformOf(picture->metadata.icc).Apply(picture->image);
+  if (request.look.profiles && profiles)
+    (void)TransformOf(picture->metadata.icc).Apply(picture->image);
   if (request.look.keepAlpha) {
     RETURN_IF_BAD(PrepareWithAlpha(*picture));
   } else {
@@ -108,7 +109,7 @@ Status PixelsForOthers(const ViewPicture& view, Color background, RgbImage& pixe
   if (!view.request.look.profiles || screenProfile.empty()) return Status::Ok;
   PackedImage image;
   RETURN_IF_BAD(ToPacked(pixels, image));
-  ColorTransform(screenProfile).Apply(image);
+  (void)ColorTransform(screenProfile).Apply(image);
   return ToRgb(image, pixels);
 }
 
@@ -194,7 +195,8 @@ bool ViewLoader::NextRequest(ViewRequest& request) {
   return false;
 }
 
-// Pictures that nobody wants go, then, from the least urgent on, those beyond the capacity.
+// Removes pictures that are no longer requested, then, from the least urgent on, those beyond the
+// capacity.
 void ViewLoader::DropUnwanted() {
   std::vector<ViewPicturePointer> kept;
   uint64_t bytes = 0;
