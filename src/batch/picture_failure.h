@@ -13,7 +13,8 @@ struct PictureRecord;
 // What a file looks like by its first bytes ("AVIF"), where that is not what its name says; empty
 // otherwise.
 std::string_view LooksLike(const std::string& fileName, int32_t formatIndex);
-// A sentence about a picture that was opened by its contents, since its name lies; empty for others.
+// A sentence about a picture that was opened by its contents, since its name lies; empty for
+// others.
 std::string MisnamedRemark(const PictureRecord& picture);
 
 // What goes behind the message of a file that could not be opened or decoded: what it looks like,

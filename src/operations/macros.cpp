@@ -166,16 +166,16 @@ std::string ExpandNameMacros(std::string_view text, const MacroFacts& facts,
   });
 }
 
-std::string MacroProblem(std::string_view text) {
-  std::string problem;
+RecordedText MacroProblem(std::string_view text) {
+  RecordedText problem;
   Scan(text, [](std::string_view) {},
        [&](std::string_view rest) -> size_t {
          const auto macro = MacroAt(rest);
          if (!macro && problem.empty()) {
            problem = rest.starts_with("%E")
-                         ? "needs the name of a tag in %E{Tag}"
-                         : "has an unknown macro " + std::string(rest.substr(0, 2)) +
-                               "; %% is a percent sign";
+                         ? TrRecorded("needs the name of a tag in %E{Tag}")
+                         : TrRecorded("has an unknown macro %1; %% is a percent sign",
+                                      rest.substr(0, 2));
          }
          return macro ? macro->length : 1;
        });

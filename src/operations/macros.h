@@ -5,6 +5,7 @@
 #include <string_view>
 
 #include "picture/picture_record.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -35,7 +36,7 @@ std::string ExpandNameMacros(std::string_view text, const MacroFacts& facts,
 
 // What is wrong with the macros of a text, as the end of a sentence: "has an unknown macro %Q".
 // Empty when nothing is.
-std::string MacroProblem(std::string_view text);
+RecordedText MacroProblem(std::string_view text);
 
 // Whether a text can be expanded before the picture is decoded and worked on: it has no macro about
 // the picture.

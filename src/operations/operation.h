@@ -71,7 +71,8 @@ using ReachFunction = int32_t (*)(const Arguments& arguments);
 // What is wrong with the arguments together, once each of them is right: a sentence without the
 // operation's name, and the parameter that it is about; empty when nothing is.
 struct ArgumentProblem {
-  std::string parameter, message;
+  std::string parameter;
+  RecordedText message;
 };
 // Called once each argument is right.
 using CheckFunction = ArgumentProblem (*)(const Arguments& arguments);

@@ -72,102 +72,105 @@ std::string Decimal(double number) {
   return text;
 }
 
-std::string OutOfLimits(const Parameter& row) {
-  if (row.most >= 1e9) return "must be at least " + Decimal(row.least);
-  return "must be " + Decimal(row.least) + " to " + Decimal(row.most);
+RecordedText OutOfLimits(const Parameter& row) {
+  if (row.most >= 1e9) return TrRecorded("must be at least %1", Decimal(row.least));
+  return TrRecorded("must be %1 to %2", Decimal(row.least), Decimal(row.most));
 }
 
 bool InLimits(const Parameter& row, double number) {
   return number >= row.least && number <= row.most;
 }
 
-std::string ReadNumber(const Parameter& row, std::string_view text, Value& value) {
+RecordedText ReadNumber(const Parameter& row, std::string_view text, Value& value) {
   if (row.kind == ParameterKind::kPercent && text.ends_with('%')) text.remove_suffix(1);
   const auto number = WholeDecimal(text);
   const bool whole = row.kind == ParameterKind::kInteger;
-  if (!number)
-    return whole                                 ? "must be a whole number"
-           : row.kind == ParameterKind::kPercent ? "must be a percentage"
-                                                 : "must be a number";
+  if (!number) {
+    return whole                                 ? TrRecorded("must be a whole number")
+           : row.kind == ParameterKind::kPercent ? TrRecorded("must be a percentage")
+                                                 : TrRecorded("must be a number");
+  }
   if (!InLimits(row, *number)) return OutOfLimits(row);
-  if (whole && *number != std::floor(*number)) return "must be a whole number";
+  if (whole && *number != std::floor(*number)) return TrRecorded("must be a whole number");
   value.number = *number;
   return {};
 }
 
 // Checks the number of a length by the row's limits.
-std::string CheckLength(const Parameter& row, const Length& length) {
-  return InLimits(row, length.number) ? std::string() : OutOfLimits(row);
+RecordedText CheckLength(const Parameter& row, const Length& length) {
+  return InLimits(row, length.number) ? RecordedText() : OutOfLimits(row);
 }
 
-std::string ReadLength(const Parameter& row, std::string_view text, Value& value) {
+RecordedText ReadLength(const Parameter& row, std::string_view text, Value& value) {
   const bool points = std::string_view(row.unit) == "pt";
   if (!TakeLength(text, value.x, points ? LengthUnit::Points : LengthUnit::Pixels) || !text.empty())
-    return "must be a length such as 12, 5% or 2cm";
+    return TrRecorded("must be a length such as 12, 5% or 2cm");
   return CheckLength(row, value.x);
 }
 
-std::string ReadSize(const Parameter& row, std::string_view text, Value& value) {
-  constexpr const char* kForms = "must be a size such as 800x600, 800x, x600, 800 or 50%";
+RecordedText ReadSize(const Parameter& row, std::string_view text, Value& value) {
+  constexpr const char* kForms =
+      TrLater("must be a size such as 800x600, 800x, x600, 800 or 50%");
   value.hasWidth = TakeLength(text, value.width);
   const bool both = Take(text, 'x');
   value.hasHeight = both && TakeLength(text, value.height);
   value.longestEdge = !both;
-  if (!text.empty() || (!value.hasWidth && !value.hasHeight)) return kForms;
+  if (!text.empty() || (!value.hasWidth && !value.hasHeight)) return TrRecorded(kForms);
   if (value.hasWidth) {
-    if (const std::string wrong = CheckLength(row, value.width); !wrong.empty()) return wrong;
+    if (const RecordedText wrong = CheckLength(row, value.width); !wrong.empty()) return wrong;
   }
-  return value.hasHeight ? CheckLength(row, value.height) : std::string();
+  return value.hasHeight ? CheckLength(row, value.height) : RecordedText();
 }
 
-std::string ReadPoint(const Parameter& row, std::string_view text, Value& value) {
+RecordedText ReadPoint(const Parameter& row, std::string_view text, Value& value) {
   if (!TakeLength(text, value.x) || !Take(text, ',') || !TakeLength(text, value.y) ||
       !text.empty()) {
-    return "must be a point such as 10,20 or 50%,50%";
+    return TrRecorded("must be a point such as 10,20 or 50%,50%");
   }
-  const std::string wrong = CheckLength(row, value.x);
+  const RecordedText wrong = CheckLength(row, value.x);
   return wrong.empty() ? CheckLength(row, value.y) : wrong;
 }
 
-std::string ReadRectangle(const Parameter& row, std::string_view text, Value& value) {
-  constexpr const char* kForms =
-      "must be a rectangle such as 400x300+10+20, a size such as 400x300, or a ratio such as 3:2";
-  if (!TakeLength(text, value.width)) return kForms;
+RecordedText ReadRectangle(const Parameter& row, std::string_view text, Value& value) {
+  constexpr const char* kForms = TrLater(
+      "must be a rectangle such as 400x300+10+20, a size such as 400x300, or a ratio such as 3:2");
+  if (!TakeLength(text, value.width)) return TrRecorded(kForms);
   value.ratio = Take(text, ':');
-  if (!value.ratio && !Take(text, 'x')) return kForms;
-  if (!TakeLength(text, value.height)) return kForms;
+  if (!value.ratio && !Take(text, 'x')) return TrRecorded(kForms);
+  if (!TakeLength(text, value.height)) return TrRecorded(kForms);
   if (value.width.number <= 0 || value.height.number <= 0)
-    return "must have a width and a height above 0";
+    return TrRecorded("must have a width and a height above 0");
   if (!value.ratio && !text.empty()) {
     value.hasPlace = true;
     // "+10" and "-10": the sign belongs to the number.
     if ((text[0] != '+' && text[0] != '-') || !TakeLength(text, value.x) || text.empty() ||
         (text[0] != '+' && text[0] != '-') || !TakeLength(text, value.y)) {
-      return kForms;
+      return TrRecorded(kForms);
     }
   }
-  if (!text.empty()) return kForms;
+  if (!text.empty()) return TrRecorded(kForms);
   for (const Length& length : {value.width, value.height, value.x, value.y}) {
     if (std::abs(length.number) > row.most) return OutOfLimits(row);
   }
   return {};
 }
 
-std::string ReadCurve(std::string_view text, Value& value) {
+RecordedText ReadCurve(std::string_view text, Value& value) {
   constexpr const char* kForms =
-      "must be two or more points such as \"0,0 64,80 255,255\", from left to right";
+      TrLater("must be two or more points such as \"0,0 64,80 255,255\", from left to right");
   while (!text.empty()) {
     if (Take(text, ' ')) continue;
     const auto x = TakeDecimal(text);
-    if (!x || !Take(text, ',')) return kForms;
+    if (!x || !Take(text, ',')) return TrRecorded(kForms);
     const auto y = TakeDecimal(text);
-    if (!y || (!text.empty() && text[0] != ' ')) return kForms;
-    if (*x < 0 || *x > 255 || *y < 0 || *y > 255) return "must have values from 0 to 255";
-    if (!value.points.empty() && *x <= value.points.back().x) return kForms;
-    if (value.points.size() == 256) return kForms;
+    if (!y || (!text.empty() && text[0] != ' ')) return TrRecorded(kForms);
+    if (*x < 0 || *x > 255 || *y < 0 || *y > 255)
+      return TrRecorded("must have values from 0 to 255");
+    if (!value.points.empty() && *x <= value.points.back().x) return TrRecorded(kForms);
+    if (value.points.size() == 256) return TrRecorded(kForms);
     value.points.push_back({*x, *y});
   }
-  return value.points.size() >= 2 ? std::string() : kForms;
+  return value.points.size() >= 2 ? RecordedText() : TrRecorded(kForms);
 }
 
 std::vector<std::string_view> WordsOf(std::string_view list) {
@@ -176,19 +179,19 @@ std::vector<std::string_view> WordsOf(std::string_view list) {
   return words;
 }
 
-std::string ReadChoice(const Parameter& row, std::string_view text, Value& value) {
+RecordedText ReadChoice(const Parameter& row, std::string_view text, Value& value) {
   value.choice = PlaceOfWord(row.choices, LowerCase(text));
   if (value.choice >= 0) return {};
-  std::string known;
   const auto words = WordsOf(row.choices);
-  for (size_t i = 0; i < words.size(); ++i) {
-    known += i == 0 ? "" : i + 1 == words.size() ? " or " : ", ";
-    known += words[i];
-  }
-  return "must be " + known + "." + NearestNameHint(text, words);
+  std::string known;
+  for (size_t i = 0; i + 1 < words.size(); ++i) known.append(i == 0 ? "" : ", ").append(words[i]);
+  RecordedText wrong = words.size() == 1 ? TrRecorded("must be %1.", words[0])
+                                         : TrRecorded("must be %1 or %2.", known, words.back());
+  wrong.Append(NearestNameQuestion(text, words));
+  return wrong;
 }
 
-std::string ReadFlag(std::string_view text, Value& value) {
+RecordedText ReadFlag(std::string_view text, Value& value) {
   for (const std::string_view yes : {"yes", "true", "on", "1"}) {
     if (EqualIgnoringCase(text, yes)) {
       value.choice = 1;
@@ -198,10 +201,10 @@ std::string ReadFlag(std::string_view text, Value& value) {
   for (const std::string_view no : {"no", "false", "off", "0"}) {
     if (EqualIgnoringCase(text, no)) return {};
   }
-  return "must be yes or no";
+  return TrRecorded("must be yes or no");
 }
 
-std::string ReadByKind(const Parameter& row, std::string_view text, Value& value) {
+RecordedText ReadByKind(const Parameter& row, std::string_view text, Value& value) {
   switch (row.kind) {
     case ParameterKind::kInteger:
     case ParameterKind::kNumber:
@@ -210,8 +213,9 @@ std::string ReadByKind(const Parameter& row, std::string_view text, Value& value
     case ParameterKind::kSize: return ReadSize(row, text, value);
     case ParameterKind::kLength: return ReadLength(row, text, value);
     case ParameterKind::kColor:
-      return ReadColor(text, value.color) ? std::string()
-                                          : "must be a color such as #ff8800, #ff880080 or orange";
+      return ReadColor(text, value.color)
+                 ? RecordedText()
+                 : TrRecorded("must be a color such as #ff8800, #ff880080 or orange");
     case ParameterKind::kChoice: return ReadChoice(row, text, value);
     case ParameterKind::kFlag: return ReadFlag(text, value);
     case ParameterKind::kPoint: return ReadPoint(row, text, value);
@@ -220,10 +224,11 @@ std::string ReadByKind(const Parameter& row, std::string_view text, Value& value
     case ParameterKind::kText:
     case ParameterKind::kFile: break;
   }
-  if (text.find('\0') != std::string_view::npos) return "must not contain a zero byte";
+  if (text.find('\0') != std::string_view::npos) return TrRecorded("must not contain a zero byte");
   const bool tooLong =
       row.most > 0 && row.most < 1e9 && static_cast<double>(text.size()) > row.most;
-  return tooLong ? "must have at most " + Decimal(row.most) + " characters" : std::string();
+  return tooLong ? TrRecorded("must have at most %1 characters", Decimal(row.most))
+                 : RecordedText();
 }
 
 }  // namespace
@@ -248,10 +253,10 @@ double Length::Pixels(double whole, double dpi) const {
   return number;
 }
 
-std::string ReadValue(const Parameter& row, std::string_view text, Value& value) {
+RecordedText ReadValue(const Parameter& row, std::string_view text, Value& value) {
   Value read;
   read.text = text;
-  std::string wrong = ReadByKind(row, text, read);
+  RecordedText wrong = ReadByKind(row, text, read);
   if (!wrong.empty()) return wrong;
   read.given = true;
   value = std::move(read);

@@ -8,6 +8,7 @@
 
 #include "picture/rectangle.h"
 #include "processing/geometry/scale.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -76,7 +77,7 @@ struct CurvePoint {
 // A parameter's value. Which fields count depends on the kind.
 struct Value {
   bool given = false;            // it has a value: written down, or by default
-  bool byDefault = false;        // nobody wrote it down
+  bool byDefault = false;        // not given by the recipe
   std::string text;              // as written; Text and File: the value
   double number = 0;             // Integer, Number, Percent (60 for 60 %), Angle
   int32_t choice = 0;            // Choice: its place in the row's list; Flag: 0 or 1
@@ -91,7 +92,7 @@ struct Value {
 
 // Reads a value for a row from its text. Empty when it is right, else what is wrong, as the end of
 // a sentence that begins with the parameter's name: "must be 0 to 100".
-std::string ReadValue(const Parameter& row, std::string_view text, Value& value);
+RecordedText ReadValue(const Parameter& row, std::string_view text, Value& value);
 
 // A color as people write it. False for anything else.
 bool ReadColor(std::string_view text, AlphaColor& color);

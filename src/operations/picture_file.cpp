@@ -45,11 +45,11 @@ Status LoadPictureFile(const std::string& name, std::shared_ptr<const PictureRec
   return Status::Ok;
 }
 
-std::string PictureFileProblem(const std::string& name) {
+RecordedText PictureFileProblem(const std::string& name) {
   PicturePointer picture;
   const Status status = LoadPictureInfo({.fileName = PathOf(name)}, picture);
   if (status == Status::Ok) return {};
-  return "names no picture that can be read: " + name;
+  return TrRecorded("names no picture that can be read: %1", name);
 }
 
 }  // namespace fotomill

@@ -5,6 +5,7 @@
 
 #include "core/status.h"
 #include "picture/picture_record.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -15,6 +16,6 @@ namespace fotomill {
 Status LoadPictureFile(const std::string& name, std::shared_ptr<const PictureRecord>& picture);
 
 // What is wrong with such a name, as the end of a sentence; empty when the file is a picture.
-std::string PictureFileProblem(const std::string& name);
+RecordedText PictureFileProblem(const std::string& name);
 
 }  // namespace fotomill

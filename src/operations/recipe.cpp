@@ -4,13 +4,13 @@
 #include <charconv>
 #include <cstdio>
 
-#include "texts/name_hint.h"
 #include "core/plain_name.h"
 #include "core/text.h"
 #include "core/whole_number.h"
 #include "operations/macros.h"
 #include "operations/operations.h"
 #include "operations/recipe_words.h"
+#include "texts/name_hint.h"
 
 namespace fotomill {
 
@@ -64,8 +64,8 @@ std::string KeyText(const Parameter& row, const KeyValues& keys) {
 }
 
 // What is wrong with a value beyond its kind.
-std::string ReadChecked(const Parameter& row, std::string_view text, Value& value) {
-  std::string wrong = ReadValue(row, text, value);
+RecordedText ReadChecked(const Parameter& row, std::string_view text, Value& value) {
+  RecordedText wrong = ReadValue(row, text, value);
   return wrong.empty() && row.kind == kText ? MacroProblem(text) : wrong;
 }
 
@@ -87,8 +87,10 @@ std::vector<std::string_view> ParameterNames(std::span<const Parameter> rows) {
   return names;
 }
 
-std::string Sentence(std::string text) {
-  if (!text.empty() && text.back() != '.' && text.back() != '?') text += '.';
+RecordedText Sentence(RecordedText text) {
+  for (std::string* form : {&text.english, &text.shown}) {
+    if (!form->empty() && form->back() != '.' && form->back() != '?') *form += '.';
+  }
   return text;
 }
 
@@ -98,11 +100,11 @@ class Reader {
 
   std::vector<Mistake> Read(std::string_view text, Recipe& recipe) {
     if (text.size() > kMostRecipeBytes) {
-      AddMistake(1, {}, {}, "The recipe is longer than a megabyte.");
+      AddMistake(1, {}, {}, TrRecorded("The recipe is longer than a megabyte."));
       return std::move(mistakes_);
     }
     const std::vector<RecipeLine> lines = SplitRecipe(text);
-    if (lines.empty()) AddMistake(1, {}, {}, "The recipe has no operations.");
+    if (lines.empty()) AddMistake(1, {}, {}, TrRecorded("The recipe has no operations."));
     for (const RecipeLine& line : lines) ReadLine(line);
     if (recipe_.outputs.empty()) recipe_.outputs.push_back(std::move(unnamed_));
     if (mistakes_.empty()) recipe = std::move(recipe_);
@@ -110,7 +112,8 @@ class Reader {
   }
 
  private:
-  void AddMistake(int32_t line, std::string operation, std::string parameter, std::string message) {
+  void AddMistake(int32_t line, std::string operation, std::string parameter,
+                  RecordedText message) {
     mistakes_.push_back(
         {line, std::move(operation), std::move(parameter), Sentence(std::move(message))});
   }
@@ -119,10 +122,12 @@ class Reader {
 
   void ReadLine(const RecipeLine& line) {
     const std::string& name = line.words[0].text;
-    if (line.open) return AddMistake(line.number, name, {}, "has a quote that does not end");
+    if (line.open)
+      return AddMistake(line.number, name, {}, TrRecorded("has a quote that does not end"));
     if (name == kOutputWord) return ReadOutput(line);
     if (Current().hasSave)
-      return AddMistake(line.number, name, {}, "follows \"save\", which ends an output");
+      return AddMistake(line.number, name, {},
+                        TrRecorded("follows \"save\", which ends an output"));
     if (name == kSaveWord) return ReadSave(line);
     const Operation* const operation = FindOperation(name);
     if (operation == nullptr) return RefuseName(line.number, name);
@@ -140,27 +145,30 @@ class Reader {
   void RefuseName(int32_t line, const std::string& name) {
     std::vector<std::string_view> names{kOutputWord, kSaveWord};
     for (const Operation* operation : Operations()) names.emplace_back(operation->name);
-    AddMistake(line, name, {}, "is not an operation." + NearestNameHint(name, names));
+    RecordedText message = TrRecorded("is not an operation.");
+    message.Append(NearestNameQuestion(name, names));
+    AddMistake(line, name, {}, std::move(message));
   }
 
   void ReadOutput(const RecipeLine& line) {
     const std::string word(kOutputWord);
     if (recipe_.outputs.empty() && unnamed_.hasSave) {
-      return AddMistake(line.number, word, {}, "follows \"save\"; with outputs, each has its own");
+      return AddMistake(line.number, word, {},
+                        TrRecorded("follows \"save\"; with outputs, each has its own"));
     }
     RecipeOutput output;
     if (line.words.size() != 2) {
-      AddMistake(line.number, word, {}, "needs one name");
+      AddMistake(line.number, word, {}, TrRecorded("needs one name"));
     } else {
       output.name = line.words[1].text;
       if (output.name.empty() || output.name.size() > 64 || !IsPlainName(output.name)) {
         AddMistake(line.number, word, "name",
-                   "must be a plain name, as it becomes part of file names");
+                   TrRecorded("must be a plain name, as it becomes part of file names"));
       }
       if (std::ranges::any_of(recipe_.outputs, [&](const RecipeOutput& other) {
             return other.name == output.name;
           })) {
-        AddMistake(line.number, word, "name", "is taken by another output");
+        AddMistake(line.number, word, "name", TrRecorded("is taken by another output"));
       }
     }
     recipe_.outputs.push_back(std::move(output));
@@ -178,13 +186,15 @@ class Reader {
       const auto bytes = ReadByteCount(arguments.Text("max-bytes"));
       if (!bytes)
         return AddMistake(line.number, word, "max-bytes",
-                          "must be a number of bytes such as 40000, 200k or 2M");
+                          TrRecorded("must be a number of bytes such as 40000, 200k or 2M"));
       if (save.quality != 0)
-        return AddMistake(line.number, word, "max-bytes", "cannot be combined with quality");
+        return AddMistake(line.number, word, "max-bytes",
+                          TrRecorded("cannot be combined with quality"));
       save.mostBytes = *bytes;
     }
     if (!IsPlainName(save.name))
-      return AddMistake(line.number, word, "name", "must be a plain name; dest names the folder");
+      return AddMistake(line.number, word, "name",
+                        TrRecorded("must be a plain name; dest names the folder"));
     Current().save = std::move(save);
     Current().hasSave = true;
   }
@@ -200,7 +210,7 @@ class Reader {
       const Parameter& row = arguments.Rows()[i];
       const bool missing = row.preset == nullptr && !arguments.At(i).given;
       if (missing && mistakes_.size() == before)
-        AddMistake(line.number, line.words[0].text, row.name, "must be given");
+        AddMistake(line.number, line.words[0].text, row.name, TrRecorded("must be given"));
     }
     return mistakes_.size() == before;
   }
@@ -221,8 +231,9 @@ class Reader {
     std::string_view value = named ? text.substr(word.equals + 1) : text;
     if (named && place == rows.size()) {
       const auto names = ParameterNames(rows);
-      return AddMistake(line.number, operation, name,
-                        "is not a parameter of " + operation + "." + NearestNameHint(name, names));
+      RecordedText message = TrRecorded("is not a parameter of %1.", operation);
+      message.Append(NearestNameQuestion(name, names));
+      return AddMistake(line.number, operation, name, std::move(message));
     }
     const bool flag = !named && !word.quoted && place < rows.size() && rows[place].kind == kFlag;
     if (flag) {
@@ -230,15 +241,16 @@ class Reader {
     } else if (!named) {
       place = next++;
       if (place >= rows.size())
-        return AddMistake(line.number, operation, word.text, "is more than the operation takes");
+        return AddMistake(line.number, operation, word.text,
+                          TrRecorded("is more than the operation takes"));
     }
     if (arguments.At(place).given)
-      return AddMistake(line.number, operation, rows[place].name, "is given twice");
+      return AddMistake(line.number, operation, rows[place].name, TrRecorded("is given twice"));
     // An empty value is that of a parameter that is not set.
     const bool unset =
         value.empty() && rows[place].preset != nullptr && *rows[place].preset == '\0';
     if (unset) return;
-    if (const std::string wrong = ReadChecked(rows[place], value, arguments.At(place));
+    if (const RecordedText wrong = ReadChecked(rows[place], value, arguments.At(place));
         !wrong.empty()) {
       AddMistake(line.number, operation, rows[place].name, wrong);
       arguments.At(place).given = true;  // reported once
@@ -286,11 +298,13 @@ bool Recipe::OnlyMovesPixels() const {
 }
 
 std::string Mistake::Text(bool withLine) const {
-  std::string text;
-  if (withLine) text.append("Line ").append(std::to_string(line)).append(": ");
-  if (!operation.empty() && parameter.empty()) text.append("\"").append(operation).append("\" ");
-  if (!parameter.empty()) text.append(operation).append(": \"").append(parameter).append("\" ");
-  return text.append(message);
+  std::string text = message.shown;
+  if (!parameter.empty()) {
+    text = Tr("%1: \"%2\" %3", operation, parameter, text);
+  } else if (!operation.empty()) {
+    text = Tr("\"%1\" %2", operation, text);
+  }
+  return withLine ? Tr("Line %1: %2", line, text) : text;
 }
 
 std::vector<Mistake> ReadRecipe(std::string_view text, const KeyValues& keys, Recipe& recipe) {
@@ -331,12 +345,12 @@ Step DefaultStep(const Operation& operation, const KeyValues& keys) {
   return step;
 }
 
-std::string SetArgument(Step& step, std::string_view parameter, std::string_view text) {
+RecordedText SetArgument(Step& step, std::string_view parameter, std::string_view text) {
   const std::span<const Parameter> rows = step.arguments.Rows();
   for (size_t i = 0; i < rows.size(); ++i) {
     if (rows[i].name == parameter) return ReadChecked(rows[i], text, step.arguments.At(i));
   }
-  return "is not a parameter of " + std::string(step.operation->name);
+  return TrRecorded("is not a parameter of %1.", step.operation->name);
 }
 
 std::optional<std::string> DefaultText(const Parameter& row, const KeyValues& keys) {

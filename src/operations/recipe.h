@@ -65,7 +65,7 @@ struct Mistake {
   int32_t line = 0;       // from 1
   std::string operation;  // as written; empty where it is not about one
   std::string parameter;  // likewise
-  std::string message;    // a sentence that is complete with those: "must be 0 to 100."
+  RecordedText message;   // a sentence that is complete with those: "must be 0 to 100."
 
   // For people: "Line 2: resize: filter must be ..."; without the line for recipes of one line.
   std::string Text(bool withLine = true) const;
@@ -88,7 +88,7 @@ std::string PrintStep(const Step& step);  // one step as the recipe has it
 Step DefaultStep(const Operation& operation, const KeyValues& keys);
 // Gives a parameter of a step a value, for dialogs. Empty when done, else what is wrong, as
 // ReadValue says.
-std::string SetArgument(Step& step, std::string_view parameter, std::string_view text);
+RecordedText SetArgument(Step& step, std::string_view parameter, std::string_view text);
 // The text of a parameter's default: that of its key, else its preset; nullopt when there is none.
 std::optional<std::string> DefaultText(const Parameter& row, const KeyValues& keys);
 

@@ -64,11 +64,11 @@ std::string ReadFile(const std::string& path, std::string& text) {
   constexpr uint64_t kMost = 1 << 20;
   switch (platform::ReadWholeFile(path, kMost, text)) {
     case platform::ReadResult::Done: return {};
-    case platform::ReadResult::Missing: return "There is no recipe \"" + path + "\".";
-    case platform::ReadResult::TooLarge: return "\"" + path + "\" is longer than a megabyte.";
+    case platform::ReadResult::Missing: return Tr("There is no recipe \"%1\".", path);
+    case platform::ReadResult::TooLarge: return Tr("\"%1\" is longer than a megabyte.", path);
     case platform::ReadResult::Failed: break;
   }
-  return WithReason("\"" + path + "\" cannot be read.");
+  return WithReason(Tr("\"%1\" cannot be read.", path));
 }
 
 }  // namespace
@@ -107,7 +107,7 @@ std::string FindRecipe(const std::string& nameOrFile, std::string& text, std::st
   if (platform::FileExists(nameOrFile)) return ReadFile(path, text);
   std::vector<std::string_view> names;
   for (const NamedRecipe& recipe : recipes) names.emplace_back(recipe.name);
-  return "There is no recipe \"" + nameOrFile + "\"." + NearestNameHint(nameOrFile, names);
+  return Tr("There is no recipe \"%1\".", nameOrFile) + NearestNameHint(nameOrFile, names);
 }
 
 }  // namespace fotomill

@@ -12,8 +12,8 @@ namespace {
 
 using namespace std::string_view_literals;
 
-// A signature and the extension of the row that means such files, or under which a plug-in may; none
-// for files that are not pictures.
+// A signature and the extension of the row that means such files, or under which a plug-in may;
+// none for files that are not pictures.
 struct SignatureOfRow {
   std::string_view extension;
   Signature signature;
@@ -58,15 +58,11 @@ constexpr SignatureOfRow kWithoutCodec[] = {
     {"PDF",  {0, "%PDF-"sv, "PDF"}},
     {"EPS",  {0, "%!PS"sv, "PostScript"}},
     {"EPS",  {0, "\xc5\xd0\xd3\xc6"sv, "EPS"}},
-    {"RAS",  {0, "\x59\xa6\x6a\x95"sv, TrLater("Sun raster")}},
-    {"DCX",  {0, "\xb1\x68\xde\x3a"sv, "DCX"}},
     {"WMF",  {0, "\xd7\xcd\xc6\x9a"sv, "WMF"}},
     {"FLI",  {4, "\x11\xaf"sv, "FLIC"}},
     {"FLC",  {4, "\x11\xaf"sv}},
     {"FLC",  {4, "\x12\xaf"sv, "FLIC"}},
     {"FLI",  {4, "\x12\xaf"sv}},
-    {"MSP",  {0, "DanM"sv, "Microsoft Paint"}},
-    {"MSP",  {0, "LinS"sv, "Microsoft Paint"}},
     {"FIF",  {0, "FIF\1"sv, "FIF"}},
     {"",     {0, "\x1a\x45\xdf\xa3"sv, TrLater("WebM or Matroska")}},
     {"WMV",  {0, "\x30\x26\xb2\x75\x8e\x66\xcf\x11"sv, "WMV"}},

@@ -4,7 +4,6 @@
 
 #include "core/nearest_name.h"
 #include "core/text.h"
-#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -91,10 +90,14 @@ std::string_view KnownSynonym(std::string_view typed, std::span<const std::strin
 }  // namespace
 
 std::string NearestNameHint(std::string_view typed, std::span<const std::string_view> names) {
+  const RecordedText question = NearestNameQuestion(typed, names);
+  return question.empty() ? std::string() : " " + question.shown;
+}
+
+RecordedText NearestNameQuestion(std::string_view typed, std::span<const std::string_view> names) {
   const std::string_view synonym = KnownSynonym(typed, names);
   const std::string_view nearest = synonym.empty() ? NearestName(typed, names) : synonym;
-  return nearest.empty() ? std::string()
-                         : std::string(" ").append(Tr("Did you mean \"%1\"?", nearest));
+  return nearest.empty() ? RecordedText() : TrRecorded("Did you mean \"%1\"?", nearest);
 }
 
 }  // namespace fotomill

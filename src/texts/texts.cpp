@@ -7,12 +7,14 @@
 #include <cstdio>
 #include <cstdlib>
 #include <span>
+#include <utility>
 
 #include "core/text.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
 #include "platform/process.h"
+#include "texts/grouped_count.h"
 
 namespace fotomill {
 
@@ -108,6 +110,17 @@ std::string Filled(std::string_view text, std::span<const TextArgument> argument
   return result;
 }
 
+// The form for a count, which is %1 as `digits`.
+std::string FilledCount(const char* one, const char* many, uint64_t count, std::string digits,
+                        std::initializer_list<TextArgument> arguments) {
+  const char* const english = count == 1 ? one : many;
+  const char* const text =
+      state.translated ? dngettext(kDomain, one, many, static_cast<unsigned long>(count)) : english;
+  std::vector<TextArgument> all{std::move(digits)};
+  all.insert(all.end(), arguments);
+  return Filled(text, all);
+}
+
 }  // namespace
 
 bool StartTexts(const std::string& code) {
@@ -191,13 +204,12 @@ void RecordedText::Append(const RecordedText& more) {
 
 std::string TrCountArguments(const char* one, const char* many, uint64_t count,
                              std::initializer_list<TextArgument> arguments) {
-  const char* const english = count == 1 ? one : many;
-  const char* const text =
-      state.translated ? dngettext(kDomain, one, many, static_cast<unsigned long>(count)) : english;
-  // Scripts read the English lines, so their numbers are plain.
-  std::vector<TextArgument> all{state.translated ? ThousandsText(count) : std::to_string(count)};
-  all.insert(all.end(), arguments);
-  return Filled(text, all);
+  return FilledCount(one, many, count, std::to_string(count), arguments);
+}
+
+std::string TrGroupedCountArguments(const char* one, const char* many, uint64_t count,
+                                    std::initializer_list<TextArgument> arguments) {
+  return FilledCount(one, many, count, ThousandsText(count), arguments);
 }
 
 }  // namespace fotomill

@@ -42,8 +42,8 @@ std::string Tr(const char* text, const Arguments&... arguments) {
   return TrArguments(text, {TextArgument(arguments)...});
 }
 
-// The form of a text that a count asks for. The count is %1, with thousands separated; the
-// arguments follow as %2, ...
+// The form of a text that a count asks for. The count is %1, in plain digits, as scripts read it
+// (for windows see grouped_count.h); the arguments follow as %2, ...
 std::string TrCountArguments(const char* one, const char* many, uint64_t count,
                              std::initializer_list<TextArgument> arguments);
 // The same with any number of arguments.
@@ -58,7 +58,7 @@ struct RecordedText {
   std::string english, shown;
 
   bool empty() const { return english.empty(); }
-  void Append(const RecordedText& more);  // behind a blank
+  void Append(const RecordedText& more);  // behind a blank, unless it is empty
 };
 // English and translation at once.
 RecordedText TrRecordedArguments(const char* text, std::initializer_list<TextArgument> arguments);

@@ -90,7 +90,7 @@ TEST(EveryOperation, HasARowThatFaceAndEngineCanUse) {
       EXPECT_LE(row.least, row.most);
       Value value;
       if (row.preset != nullptr && *row.preset != '\0') {
-        EXPECT_EQ(ReadValue(row, row.preset, value), "");
+        EXPECT_EQ(ReadValue(row, row.preset, value).english, "");
       }
     }
     const Recipe recipe = Read(operation->example);

@@ -65,7 +65,7 @@ TEST(Recipe, MistakesTellWhereAndWhatWasMeant) {
     EXPECT_EQ(mistakes[0].operation, row.operation);
     EXPECT_EQ(mistakes[0].parameter, row.parameter);
     if (row.message != nullptr) {
-      EXPECT_EQ(mistakes[0].message, row.message);
+      EXPECT_EQ(mistakes[0].message.english, row.message);
     }
   }
 }
@@ -79,8 +79,8 @@ TEST(Macros, AreExpandedAndMadeSafeForNames) {
   EXPECT_EQ(ExpandNameMacros("%N/x", facts, picture), "Jo-Mo/x");
   EXPECT_TRUE(IsKnownEarly("%F-%N"));
   EXPECT_FALSE(IsKnownEarly("%F-%W"));
-  EXPECT_EQ(MacroProblem("100%"), "has an unknown macro %; %% is a percent sign");
-  EXPECT_EQ(MacroProblem("%E{}"), "needs the name of a tag in %E{Tag}");
+  EXPECT_EQ(MacroProblem("100%").english, "has an unknown macro %; %% is a percent sign");
+  EXPECT_EQ(MacroProblem("%E{}").english, "needs the name of a tag in %E{Tag}");
 }
 
 }  // namespace

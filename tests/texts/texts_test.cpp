@@ -9,6 +9,7 @@
 #include "platform/files.h"
 #include "registry/registry.h"
 #include "support/files.h"
+#include "texts/grouped_count.h"
 
 namespace fotomill {
 namespace {
@@ -25,6 +26,7 @@ TEST(Texts, CountsChooseTheForm) {
   EXPECT_EQ(TrCount("one file", "%1 files", 1), "one file");
   EXPECT_EQ(TrCount("one file", "%1 files", 0), "0 files");
   EXPECT_EQ(TrCount("%1 file in %2", "%1 files in %2", 12345, "x"), "12345 files in x");
+  EXPECT_EQ(TrGroupedCount("%1 file in %2", "%1 files in %2", 12345, "x"), "12,345 files in x");
 }
 
 TEST(Texts, RecordedTextsKeepTheirEnglish) {
@@ -57,6 +59,11 @@ TEST(Texts, TablesAreMarkedForTranslation) {
   }
   for (int32_t i = 0; i < formatCount; ++i) {
     if (const std::string_view reason = FormatRow(i).whyNot; !reason.empty()) expect(reason);
+    // "It looks like an icon."; other names are proper ones
+    for (const Signature& signature : FormatRow(i).signatures) {
+      if (signature.name.starts_with("a ") || signature.name.starts_with("an "))
+        expect(signature.name);
+    }
   }
 }
 

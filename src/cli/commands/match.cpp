@@ -123,9 +123,14 @@ int RunMatch(const MatchOptions& options, const CommandContext& context) {
 void SetUpMatch(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<MatchOptions>();
   context.names.Declare("NAME...", "File names; without --contents they need not exist", 1);
-  AddFlag(app, "--contents", options->contents, "Open the files and tell which format they really are");
-  AddFlag(app, "--json", options->json, "Print a JSON array of {name, index, extension, typeName}; with --contents also of what the files hold");
-  SetFooter(app, "The exit status is 1 if a name selects no format or, with --contents, a file cannot be opened.",
+  AddFlag(app, "--contents", options->contents,
+          "Open the files and tell which format they really are");
+  AddFlag(app, "--json", options->json,
+          "Print a JSON array of {name, index, extension, typeName}; with --contents also of what "
+          "the files hold");
+  SetFooter(app,
+            "The exit status is 1 if a name selects no format or, with --contents, a file cannot "
+            "be opened.",
             "fotomill match --contents scan.tiff photo.jpeg");
   context.run = [options, &context] {
     return options->contents ? RunMatchContents(*options, context) : RunMatch(*options, context);

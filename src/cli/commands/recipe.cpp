@@ -86,7 +86,7 @@ int RunCheck(bool json, const CommandContext& context) {
         output.Element({{"line", mistake.line},
                         {"operation", mistake.operation},
                         {"parameter", mistake.parameter},
-                        {"message", mistake.message}});
+                        {"message", mistake.message.english}});
       } else {
         output.Message(output.ShownMessage(name + ": " + mistake.Text()));
       }

@@ -1,6 +1,7 @@
 #include "formats/rows.h"
 
 #include "formats/cals/cals.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -8,7 +9,7 @@ namespace {
 
 using namespace std::string_view_literals;
 
-constexpr Signature kSignatures[] = {{0, "srcdocid:"sv, "a CALS raster"}};
+constexpr Signature kSignatures[] = {{0, "srcdocid:"sv, TrLater("a CALS raster")}};
 
 constexpr FormatEntry Row(std::string_view extension) {
   return {.info = CalsInfo,

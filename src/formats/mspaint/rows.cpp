@@ -1,6 +1,7 @@
 #include "formats/rows.h"
 
 #include "formats/mspaint/msp.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -8,8 +9,8 @@ namespace {
 
 using namespace std::string_view_literals;
 
-constexpr Signature kSignatures[] = {{0, "DanM"sv, "a Microsoft Paint picture"},
-                                     {0, "LinS"sv, "a Microsoft Paint picture"}};
+constexpr Signature kSignatures[] = {{0, "DanM"sv, TrLater("a Microsoft Paint picture")},
+                                     {0, "LinS"sv, TrLater("a Microsoft Paint picture")}};
 
 constexpr FormatEntry kRows[] = {{
     .info = MspInfo,

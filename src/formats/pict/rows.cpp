@@ -1,6 +1,7 @@
 #include "formats/rows.h"
 
 #include "formats/pict/pict.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -8,7 +9,7 @@ namespace {
 
 using namespace std::string_view_literals;
 
-constexpr Signature kSignatures[] = {{10, "\0\x11\x02\xff"sv, "a Macintosh picture"}};
+constexpr Signature kSignatures[] = {{10, "\0\x11\x02\xff"sv, TrLater("a Macintosh picture")}};
 
 constexpr FormatEntry kRows[] = {{
     .details = PictDetails,

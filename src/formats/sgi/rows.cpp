@@ -1,6 +1,7 @@
 #include "formats/rows.h"
 
 #include "formats/sgi/sgi.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -8,8 +9,8 @@ namespace {
 
 using namespace std::string_view_literals;
 
-constexpr Signature kSignatures[] = {{0, "\x01\xda\0"sv, "an SGI image"},
-                                     {0, "\x01\xda\1"sv, "an SGI image"}};
+constexpr Signature kSignatures[] = {{0, "\x01\xda\0"sv, TrLater("an SGI image")},
+                                     {0, "\x01\xda\1"sv, TrLater("an SGI image")}};
 
 constexpr FormatEntry Row(std::string_view extension, std::string_view description,
                           uint32_t flags) {

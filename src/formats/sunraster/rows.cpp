@@ -1,6 +1,7 @@
 #include "formats/rows.h"
 
 #include "formats/sunraster/ras.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -8,7 +9,7 @@ namespace {
 
 using namespace std::string_view_literals;
 
-constexpr Signature kSignatures[] = {{0, "\x59\xa6\x6a\x95"sv, "a Sun raster"}};
+constexpr Signature kSignatures[] = {{0, "\x59\xa6\x6a\x95"sv, TrLater("a Sun raster")}};
 
 constexpr FormatEntry kRows[] = {{
     .info = RasInfo,

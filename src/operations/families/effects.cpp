@@ -45,7 +45,7 @@ constexpr Parameter kLevels[] = {
 };
 constexpr Parameter kCurves[] = {
     {.name = "points", .kind = kCurve, .preset = "0,0 255,255", .label = "Curve",
-     .help = "Old and new levels that a smooth curve goes through."},
+     .help = "Points of the curve: old level, new level."},
     {.name = "channel", .kind = kChoice, .preset = "all", .choices = "all|red|green|blue", .label = "Channel",
      .help = "Which channels change."},
 };
@@ -168,7 +168,7 @@ void LevelsOf(const Arguments& arguments, PointEffect& effect) {
 
 ArgumentProblem CheckLevels(const Arguments& arguments) {
   if (arguments.Number("black") < arguments.Number("white")) return {};
-  return {"white", "must be above black"};
+  return {"white", TrRecorded("must be above black")};
 }
 
 void Curves(const Arguments& arguments, PointEffect& effect) {
@@ -182,7 +182,7 @@ ArgumentProblem CheckOpaque(const Arguments& arguments) {
   for (size_t i = 0; i < arguments.Rows().size(); ++i) {
     const Parameter& row = arguments.Rows()[i];
     if (row.kind == kColor && arguments.At(i).color.alpha < 255)
-      return {row.name, "must be a color without transparency"};
+      return {row.name, TrRecorded("must be a color without transparency")};
   }
   return {};
 }
@@ -248,9 +248,11 @@ std::optional<MixMatrix> ReadMix(std::string_view text) {
 
 ArgumentProblem CheckChannels(const Arguments& arguments) {
   const int given = arguments.Has("keep") + arguments.Has("swap") + arguments.Has("mix");
-  if (given != 1) return {"keep", "must be given, or swap or mix, and only one of them"};
+  if (given != 1)
+    return {"keep", TrRecorded("must be given, or swap or mix, and only one of them")};
   if (!arguments.Has("mix") || ReadMix(arguments.Text("mix"))) return {};
-  return {"mix", "must be nine numbers from -200 to 200, such as \"100 0 0 0 100 0 0 0 100\""};
+  return {"mix",
+          TrRecorded("must be nine numbers from -200 to 200, such as \"100 0 0 0 100 0 0 0 100\"")};
 }
 
 // The picture becomes its alpha plane in gray; white without one.

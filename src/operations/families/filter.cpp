@@ -210,9 +210,9 @@ std::vector<double> NumbersOf(const std::string& text) {
 ArgumentProblem CheckKernel(const Arguments& arguments) {
   const size_t count = NumbersOf(arguments.Text("weights")).size();
   if (count != 9 && count != 25 && count != 49 && count != 81)
-    return {"weights", "must be 9, 25, 49 or 81 numbers"};
+    return {"weights", TrRecorded("must be 9, 25, 49 or 81 numbers")};
   if (arguments.Has("divisor") && arguments.Number("divisor") == 0)
-    return {"divisor", "must not be 0"};
+    return {"divisor", TrRecorded("must not be 0")};
   return {};
 }
 
@@ -278,7 +278,7 @@ Status RedEye(PictureRecord& picture, const Arguments& arguments, const Operatio
 }
 ArgumentProblem CheckRedEye(const Arguments& arguments) {
   if (arguments.Has("area") || arguments.Flag("faces")) return {};
-  return {"area", "must be given, or faces"};
+  return {"area", TrRecorded("must be given, or faces")};
 }
 // Faces are looked for in the whole picture.
 int32_t ReachOfRedEye(const Arguments& arguments) { return arguments.Flag("faces") ? 1 << 24 : 0; }
@@ -432,7 +432,7 @@ constexpr Operation kOperations[] = {
     {.name = "red-eye",
      .family = Family::Filter,
      .label = "Red eyes",
-     .help = "Takes the red of a flash out of eyes.",
+     .help = "Removes red eyes caused by a flash.",
      .example = "red-eye 50%x50%+10%+10%",
      .parameters = kRedEye,
      .works = Works::Neighborhood,

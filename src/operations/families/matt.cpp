@@ -126,10 +126,10 @@ ArgumentProblem CheckMatt(const Arguments& arguments) {
   const Value& textured = arguments.Of("textured");
   if (!IsTextured(arguments)) {
     return arguments.Flag("textured") && !textured.byDefault
-               ? ArgumentProblem{"texture", "must name a picture when textured is on"}
+               ? ArgumentProblem{"texture", TrRecorded("must name a picture when textured is on")}
                : ArgumentProblem{};
   }
-  const std::string problem = PictureFileProblem(arguments.Text("texture"));
+  const RecordedText problem = PictureFileProblem(arguments.Text("texture"));
   return problem.empty() ? ArgumentProblem{} : ArgumentProblem{"texture", problem};
 }
 

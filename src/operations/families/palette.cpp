@@ -61,7 +61,7 @@ constexpr Parameter kMono[] = {
 };
 // clang-format on
 
-// The standard palette of at most so many colors.
+// The standard palette with at most `colors` colors.
 PaletteChoice FixedPalette(int32_t colors) {
   struct Standard {
     int32_t colors, kind;  // of MakeDefaultPalette
@@ -87,16 +87,17 @@ std::string ColorTableFile(const Arguments& arguments) {
 }
 
 // An error text, empty when the table was read.
-std::string LoadColorTable(const std::string& path, PaletteChoice& choice) {
+RecordedText LoadColorTable(const std::string& path, PaletteChoice& choice) {
   std::string contents;
   if (!platform::IsRegularFile(path) ||
       platform::ReadWholeFile(path, kMostColorTableBytes, contents) != platform::ReadResult::Done) {
-    return "is neither optimized, fixed, gray or file nor a color table that can be read";
+    return TrRecorded(
+        "is neither optimized, fixed, gray or file nor a color table that can be read");
   }
   choice.kind = PaletteChoice::Kind::Given;
   return ReadColorTable(contents, choice.given, choice.colors) == Status::Ok
-             ? ""
-             : "names a file that is not a color table";
+             ? RecordedText()
+             : TrRecorded("names a file that is not a color table");
 }
 
 ArgumentProblem CheckReduce(const Arguments& arguments) {
@@ -105,10 +106,11 @@ ArgumentProblem CheckReduce(const Arguments& arguments) {
   if (path.empty() && (palette == "optimized" || palette == "fixed" || palette == "gray"))
     return {};
   PaletteChoice choice;
-  const std::string problem = LoadColorTable(path, choice);
+  const RecordedText problem = LoadColorTable(path, choice);
   if (problem.empty()) return {};
   if (palette == "file")
-    return {"file", "names no color table that can be read: " + arguments.Text("file")};
+    return {"file",
+            TrRecorded("names no color table that can be read: %1", arguments.Text("file"))};
   return {"palette", problem};
 }
 

@@ -218,9 +218,9 @@ Status Deskew(PictureRecord& picture, const Arguments& arguments, const Operatio
 
 constexpr Parameter kShear[] = {
     {.name = "across", .kind = kAngle, .unit = "degrees", .preset = "0", .least = -80, .most = 80, .label = "Across",
-     .help = "By how much columns lean: the bottom goes to the right."},
+     .help = "How far columns lean: positive values move the bottom to the right."},
     {.name = "down", .kind = kAngle, .unit = "degrees", .preset = "0", .least = -80, .most = 80, .label = "Down",
-     .help = "By how much rows lean after that: the right side goes down."},
+     .help = "How far rows lean after that: positive values move the right side down."},
     kBackground, kSampling,
 };
 

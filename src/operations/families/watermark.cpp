@@ -58,9 +58,9 @@ bool IsPicture(const Arguments& arguments) {
 ArgumentProblem Check(const Arguments& arguments) {
   const Value &text = arguments.Of("text"), &picture = arguments.Of("picture");
   if (picture.given && !picture.byDefault && text.given && !text.byDefault)
-    return {"picture", "cannot be combined with text"};
+    return {"picture", TrRecorded("cannot be combined with text")};
   if (!IsPicture(arguments)) return {};
-  const std::string problem = PictureFileProblem(arguments.Text("picture"));
+  const RecordedText problem = PictureFileProblem(arguments.Text("picture"));
   return problem.empty() ? ArgumentProblem{} : ArgumentProblem{"picture", problem};
 }
 

@@ -10,6 +10,7 @@
 #include "core/text.h"
 #include "platform/clock.h"
 #include "platform/paths.h"
+#include "texts/grouped_count.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -240,8 +241,8 @@ std::string BrowserModel::CountText() const {
     if (selection_.SelectedCount() == 0) bytes += items_[item].size;
   }
   for (const size_t line : selection_.SelectedLines()) bytes += Line(line).size;
-  std::string text = TrCount("%1 file", "%1 files", files);
-  if (folders > 0) text.append(", ").append(TrCount("%1 folder", "%1 folders", folders));
+  std::string text = TrGroupedCount("%1 file", "%1 files", files);
+  if (folders > 0) text.append(", ").append(TrGroupedCount("%1 folder", "%1 folders", folders));
   if (lines_.size() < items_.size()) text = Tr("%1 of %2", text, ThousandsText(items_.size()));
   if (selection_.SelectedCount() > 0)
     text.append(", ").append(Tr("%1 selected", ThousandsText(selection_.SelectedCount())));
@@ -262,7 +263,8 @@ std::string BrowserModel::FocusText() const {
 std::string SizeText(uint64_t bytes, int32_t mode) {
   constexpr const char* kUnits[] = {"KB", "MB", "GB", "TB", "PB", "EB"};
   if (mode == choice::kSizeKilobytes) return ThousandsText((bytes + 1023) / 1024) + " KB";
-  if (mode == choice::kSizeBytes || bytes < 1024) return TrCount("%1 byte", "%1 bytes", bytes);
+  if (mode == choice::kSizeBytes || bytes < 1024)
+    return TrGroupedCount("%1 byte", "%1 bytes", bytes);
   double value = static_cast<double>(bytes) / 1024;
   size_t unit = 0;
   while (value >= 999.5 && unit + 1 < std::size(kUnits)) {

@@ -11,6 +11,7 @@
 #include "registry/registry.h"
 #include "settings/job_options.h"
 #include "texts/status_text.h"
+#include "texts/grouped_count.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -39,7 +40,7 @@ void AddHeaderLines(const std::string& path, Status known, std::vector<std::stri
       Tr("%1 x %2 pixels, %3 bits", picture->width, picture->height, picture->bitsPerPixel);
   if (picture->pageCount > 1) {
     facts.append(", ").append(
-        TrCount("%1 page", "%1 pages", static_cast<uint64_t>(picture->pageCount)));
+        TrGroupedCount("%1 page", "%1 pages", static_cast<uint64_t>(picture->pageCount)));
   }
   lines.push_back(std::move(facts));
   std::string comment =

@@ -6,6 +6,7 @@
 #include "core/limits.h"
 #include "platform/files.h"
 #include "settings/configuration.h"
+#include "texts/grouped_count.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -50,15 +51,15 @@ Transfer ImportConfiguration(const std::string& path) {
     return {false, Tr("The file has no settings of this program.")};
   const SaveResult saved = SaveConfiguration();
   Transfer transfer{saved == SaveResult::Done || saved == SaveResult::Unchanged, {}};
-  transfer.message = TrCount("%1 setting was imported; all others are unchanged.",
+  transfer.message = TrGroupedCount("%1 setting was imported; all others are unchanged.",
                              "%1 settings were imported; all others are unchanged.", taken);
   if (refused > 0) {
     transfer.message.append(" ").append(
-        TrCount("%1 value was invalid.", "%1 values were invalid.", refused));
+        TrGroupedCount("%1 value was invalid.", "%1 values were invalid.", refused));
   }
   if (unknown > 0)
     transfer.message.append(" ").append(
-        TrCount("%1 key is unknown.", "%1 keys are unknown.", unknown));
+        TrGroupedCount("%1 key is unknown.", "%1 keys are unknown.", unknown));
   if (!transfer.ok) transfer.message.append(" ").append(Tr(SaveMessage(saved)));
   return transfer;
 }

@@ -9,6 +9,7 @@
 #include "platform/volumes.h"
 #include "registry/registry.h"
 #include "texts/status_text.h"
+#include "texts/grouped_count.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -26,11 +27,11 @@ std::string OutcomeText(Compacted result, int32_t before, int32_t after, uint64_
   switch (result) {
     case Compacted::Done:
       if (before == after) {
-        return TrCount("Nothing to remove: the only record is in use.",
+        return TrGroupedCount("Nothing to remove: the only record is in use.",
                        "Nothing to remove: all %1 records are in use.",
                        static_cast<uint64_t>(after));
       }
-      return TrCount("%1 record was removed, %2 remain. The file is %3 smaller.",
+      return TrGroupedCount("%1 record was removed, %2 remain. The file is %3 smaller.",
                      "%1 records were removed, %2 remain. The file is %3 smaller.",
                      static_cast<uint64_t>(before - after),
                      ThousandsText(static_cast<uint64_t>(after)),
@@ -113,7 +114,7 @@ std::string DescribeDatabase(const std::string& path) {
   if (database.OpenThumbnailDatabase(path, false) != Opened::Done ||
       !database.ReadDatabaseHeader(header))
     return Tr(kNoDatabase);
-  return TrCount("%1 record, %2", "%1 records, %2",
+  return TrGroupedCount("%1 record, %2", "%1 records, %2",
                  static_cast<uint64_t>(std::max(header.count, 0)),
                  SizeText(platform::FactsOf(path).size, choice::kSizeFitting));
 }

@@ -27,6 +27,7 @@
 #include "settings/history_list.h"
 #include "settings/settings.h"
 #include "texts/status_text.h"
+#include "texts/grouped_count.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -49,7 +50,7 @@ PastedPicture PictureOf(const wxBitmap& bitmap) {
 constexpr const char* kGnomeFiles = "x-special/gnome-copied-files";
 constexpr size_t kMostFailuresShown = 10;
 
-std::string Count(size_t files) { return TrCount("%1 file", "%1 files", files); }
+std::string Count(size_t files) { return TrGroupedCount("%1 file", "%1 files", files); }
 
 }  // namespace
 
@@ -281,8 +282,8 @@ void FileActions::ToClipboard(const std::vector<std::string>& paths, bool cut) {
   both->Add(marked);
   const wxClipboardLocker clipboard;
   if (!clipboard || !wxTheClipboard->SetData(both)) return wxBell();
-  shell_.Report(cut ? TrCount("%1 file cut.", "%1 files cut.", paths.size())
-                    : TrCount("%1 file copied.", "%1 files copied.", paths.size()));
+  shell_.Report(cut ? TrGroupedCount("%1 file cut.", "%1 files cut.", paths.size())
+                    : TrGroupedCount("%1 file copied.", "%1 files copied.", paths.size()));
 }
 
 void FileActions::PathsToClipboard(const std::vector<std::string>& paths) {

@@ -20,6 +20,7 @@
 #include "platform/paths.h"
 #include "settings/job_options.h"
 #include "texts/status_text.h"
+#include "texts/grouped_count.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -101,7 +102,7 @@ void ExifFrame::Finished() {
                                  : std::to_string(report_.thumbnail.width) + " x " +
                                        std::to_string(report_.thumbnail.height);
     thumbnailFacts_->SetLabel(wxString::FromUTF8(
-        size + "\n" + TrCount("%1 byte", "%1 bytes", report_.thumbnailBytes.size())));
+        size + "\n" + TrGroupedCount("%1 byte", "%1 bytes", report_.thumbnailBytes.size())));
   }
   for (const wxWindowID id : {wxID_COPY, wxID_SELECTALL, wxID_SAVEAS, wxID_PRINT})
     FindWindow(id)->Enable(!report_.rows.empty());
