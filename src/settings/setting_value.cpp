@@ -103,14 +103,16 @@ SettingValue ReadTextValue(const KeyRow& row, std::string_view text, ValueSource
   return value;
 }
 
-std::string ListText(const KeyRow& row) {
-  std::string text;
+RecordedText ListText(const KeyRow& row) {
+  RecordedText list;
   int32_t position = 0;
   for (const ChoiceEntry* entry = row.extra.choices; entry->text != nullptr; ++entry, ++position) {
     const int32_t number = (row.type & KEY_BY_VALUE) != 0 ? entry->value : position;
-    text += (position == 0 ? "" : ", ") + std::to_string(number) + " (" + Tr(entry->text) + ")";
+    const std::string before = (position == 0 ? "" : ", ") + std::to_string(number) + " (";
+    list.english += before + entry->text + ")";
+    list.shown += before + Tr(entry->text) + ")";
   }
-  return text;
+  return list;
 }
 
 std::string ColorText(int32_t number) {
@@ -121,17 +123,17 @@ std::string ColorText(int32_t number) {
   return text;
 }
 
-std::string NumberValues(const KeyRow& row) {
-  if ((row.type & KEY_FLAG) != 0 && !IsLooseFlag(row)) return Tr("yes or no (1 or 0)");
+RecordedText NumberValues(const KeyRow& row) {
+  if ((row.type & KEY_FLAG) != 0 && !IsLooseFlag(row)) return TrRecorded("yes or no (1 or 0)");
   if ((row.type & KEY_COLOR) != 0) {
-    return Tr(
+    return TrRecorded(
         "a color: #RRGGBB, a name such as orange, or the number blue * 65536 + green * 256 + red");
   }
   if ((row.type & KEY_CHOICE) != 0) return ListText(row);
   const std::optional<SpinRange> range = LimitsOf(row);
-  if (!range) return Tr("a whole number");
-  if (range->maximum == INT32_MAX) return Tr("a number of at least %1", range->minimum);
-  return Tr("a number from %1 to %2", range->minimum, range->maximum);
+  if (!range) return TrRecorded("a whole number");
+  if (range->maximum == INT32_MAX) return TrRecorded("a number of at least %1", range->minimum);
+  return TrRecorded("a number from %1 to %2", range->minimum, range->maximum);
 }
 
 }  // namespace
@@ -168,12 +170,12 @@ std::string DefaultValueText(const KeyRow& row) {
                                     : std::to_string(DefaultNumber(row));
 }
 
-std::string ValuesText(const KeyRow& row) {
-  if ((row.type & KEY_INTERNAL) != 0) return Tr("nothing: the program sets it");
+RecordedText ValuesText(const KeyRow& row) {
+  if ((row.type & KEY_INTERNAL) != 0) return TrRecorded("nothing: the program sets it");
   if ((row.type & KEY_TEXT) == 0) return NumberValues(row);
-  if ((row.type & KEY_DESTINATION) != 0) return Tr("the extension of a format that can be written");
-  if (HoldsName(row)) return Tr("part of a file name, at most %1 characters", TextLimit(row));
-  return Tr("a text of at most %1 characters", TextLimit(row));
+  if ((row.type & KEY_DESTINATION) != 0) return TrRecorded("the extension of a format that can be written");
+  if (HoldsName(row)) return TrRecorded("part of a file name, at most %1 characters", TextLimit(row));
+  return TrRecorded("a text of at most %1 characters", TextLimit(row));
 }
 
 std::string ReadableValue(const KeyRow& row) {
@@ -191,7 +193,7 @@ std::string FaultMessage(const KeyRow& row, ValueFault fault) {
     case ValueFault::NotFlag:
     case ValueFault::NotColor:
     case ValueFault::NotChoice:
-    case ValueFault::OutOfRange: return Tr("%1 takes %2.", row.name, ValuesText(row));
+    case ValueFault::OutOfRange: return Tr("%1 takes %2.", row.name, ValuesText(row).shown);
     case ValueFault::TooLong:
       return Tr("%1 takes at most %2 characters.", row.name, TextLimit(row));
     case ValueFault::NotText: return Tr("%1 takes no line breaks and no NUL bytes.", row.name);

@@ -5,6 +5,7 @@
 #include <string_view>
 
 #include "settings/key_table.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -54,7 +55,7 @@ std::string ReadableValue(const KeyRow& row);
 std::string ReadableDefault(const KeyRow& row);  // likewise
 
 // What the key takes, for people: "a number from 0 to 9".
-std::string ValuesText(const KeyRow& row);
+RecordedText ValuesText(const KeyRow& row);
 // As a whole sentence: "PngCompression takes a number from 0 to 9." Empty without a fault.
 std::string FaultMessage(const KeyRow& row, ValueFault fault);
 

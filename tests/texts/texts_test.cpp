@@ -41,7 +41,12 @@ TEST(Texts, TablesAreMarkedForTranslation) {
   std::string pot;
   ASSERT_EQ(platform::ReadWholeFile(test::SourcePath("po/fotomill.pot"), limits.listFileBytes, pot), platform::ReadResult::Done);
   const auto expect = [&](std::string_view text) {
-    const std::string entry = "\nmsgid \"" + std::string(text) + "\"\n";
+    std::string entry = "\nmsgid \"";
+    for (const char c : text) {
+      if (c == '"' || c == '\\') entry += '\\';
+      entry += c;
+    }
+    entry += "\"\n";
     EXPECT_NE(pot.find(entry), std::string::npos) << "mark it with TrLater and run po/update: " << text;
   };
   for (const cli::Command& command : cli::Commands()) expect(command.summary);

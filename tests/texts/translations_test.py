@@ -91,7 +91,7 @@ def check_results():
         status, _, message = run(["--lang", "de", "info", missing])
         expect("failure", f"{status} {message}", "1 ",
                "missing.bmp: Fehler beim Öffnen der Datei. Die Datei gibt es nicht.",
-               "Es sind Fehler aufgetreten", "Eine Datei wurde verarbeitet.")
+               "Es sind Fehler aufgetreten", "Eine Datei wurde verarbeitet, 1 fehlgeschlagen.")
         status, _, message = run(["--lang", "tlh", "help"])
         expect("unknown language", f"{status} {message}",
                '2 fotomill: There is no translation "tlh"; there are: en, de.')

@@ -53,7 +53,7 @@ Json KeyElement(const KeyRow& row) {
     element["default"] = DefaultNumber(row);
   }
   element["used"] = IsKeyUsed(row);
-  element["values"] = ValuesText(row);
+  element["values"] = ValuesText(row).english;
   element["description"] = KeyHelp(row);
   return element;
 }
@@ -94,7 +94,7 @@ void NoteUnused(const CommandContext& context, ResultOutput& output, const KeyRo
 void Explain(ResultOutput& output, const KeyRow& row) {
   const auto line = [&](const std::string& text) { output.Line("    " + output.Shown(text)); };
   line(Tr("Default: %1", ReadableDefault(row)));
-  line(Tr("Takes %1.", ValuesText(row)));
+  line(Tr("Takes %1.", ValuesText(row).shown));
   if (!IsKeyUsed(row)) return line(UnusedKeyText(row));
   for (const std::string& text : WrappedLines(KeyHelp(row), kTextWidth)) line(text);
 }
