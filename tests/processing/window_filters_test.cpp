@@ -132,7 +132,7 @@ TEST(WindowFilters, MediansAreTheSameOnEveryProcessor) {
 
 TEST(WindowFilters, StopWhenAsked) {
   for (const Filter& filter : kFilters) {
-    const PicturePointer picture = MakePicture(50, 400, Scatter);
+    const PicturePointer picture = MakePicture(50, 1600, Scatter);
     const std::vector<uint32_t> before = Colors(*picture);
     int32_t asked = 0;
     EXPECT_EQ(filter.apply(*picture, 2, {.goesOn = [&] { return ++asked < 3; }}), Status::FunctionCancelled);
