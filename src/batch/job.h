@@ -103,6 +103,9 @@ struct BatchJob {
   bool writeComments = false;       // into files of plug-in formats
   // ExifAdjustOrientation: pictures are turned where their orientation tag gets lost
   bool turnsUpright = true;
+  // Extensions of formats into whose files every page of a source goes where no page was asked for:
+  // MultipleImageGIF, IconCompleteStack
+  std::vector<std::string_view> everyPage;
   // Keeps a value permanently. Called on the thread that runs the batch; none: nothing is kept.
   std::function<void(Remembered what, int32_t value)> remember = {};
   ProgressModel progress;

@@ -59,6 +59,8 @@ BatchJob NewBatchJob() {
   BatchJob job;
   job.overwrite = OverwritePolicyFromSettings();
   job.faces = FaceOptionsFromSettings();
+  if (settings.MultipleImageGIF != 0) job.everyPage.push_back("GIF");
+  if (settings.IconCompleteStack != 0) job.everyPage.push_back("ICO");
   job.naming = NamingOptionsFromSettings();
   job.read = ReadOptionsFromSettings();
   job.encode = EncodeOptionsFromSettings();

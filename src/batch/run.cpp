@@ -195,7 +195,9 @@ class Batch {
     if (picture.pageCount < 2 || function_.page > 0 || picture.formatIndex == kNoFormat) return;
     const FormatEntry &from = FormatRow(picture.formatIndex), &to = FormatRow(target.formatIndex);
     const bool animation = from.animate != nullptr && (to.flags & FMT_FRAMES) != 0;
-    const bool all = function_.page == kAllPages;
+    const bool all =
+        function_.page == kAllPages ||
+        std::ranges::find(job_.everyPage, to.extension.view()) != job_.everyPage.end();
     // PNG holds frames, not pages
     const bool holds = to.sequence != nullptr && target.output->mostBytes == 0 &&
                        (animation || (all && (to.flags & FMT_PNG) == 0));

@@ -511,6 +511,12 @@ def pages(folder):
     same[0].save(folder / "same.tif", save_all=True, append_images=same[1:])
     result = run("convert", folder / "same.tif", "-o", folder / "same.gif", "--page", "all", "--reduce")
     check(len(frames_of(folder / "same.gif")[0]) == 2, f"pages in a GIF: {result.stderr}")
+    for key, source, to, count in (("MultipleImageGIF", "same.tif", "gif", 2), ("IconCompleteStack", "app.ico", "ico", 3)):
+        for value in (0, 1):
+            run("convert", folder / source, "--set", f"{key}={value}", "-o", folder / f"{key}{value}.{to}", "--reduce")
+            with Image.open(folder / f"{key}{value}.{to}") as made:
+                held = len(made.info["sizes"]) if to == "ico" else made.n_frames
+                check(held == (count if value else 1), f"{key}={value}: {held}")
     result = run("convert", folder / "doc.tif", "-o", folder / "odd.webp", "--page", "all")
     check(result.returncode == 1 and "The frames have different sizes; choose one with --page." in result.stderr and not (folder / "odd.webp").exists(), f"different sizes: {result.stderr}")
     for wrong in ("0", "none", "-1"):

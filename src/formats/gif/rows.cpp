@@ -14,6 +14,7 @@ constexpr Signature kSignatures[] = {{0, "GIF87a"sv, "GIF"}, {0, "GIF89a"sv, "GI
 constexpr FormatSetting kKeys[] = {
     {"WriteGIFInterlaced", TrLater("Interlaced")},
     {"CreateGif89", TrLater("Version 89a, with comments and transparency")},
+    {"MultipleImageGIF", TrLater("All pages of a file become frames")},
     {"FXColorDither"},
     {"FXBidirectional"},
 };

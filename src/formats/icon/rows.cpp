@@ -17,7 +17,10 @@ constexpr Signature kCursorSignatures[] = {{0, kCursor, TrLater("a cursor")}, {0
 
 constexpr Signature kAniSignatures[] = {{0, "RIFF"sv, TrLater("an animated cursor"), 8, "ACON"sv}};
 
-constexpr FormatSetting kKeys[] = {{"ICOCompression", TrLater("Compression")}};
+constexpr FormatSetting kKeys[] = {
+    {"ICOCompression", TrLater("Compression")},
+    {"IconCompleteStack", TrLater("All pages of a file become sizes")},
+};
 constexpr FormatSettings kSettings = {"ICO", "OverrideIcoBox", TrLater("Windows icon"), kKeys};
 
 constexpr FormatEntry Row(std::string_view extension, std::string_view description, uint32_t flags,
