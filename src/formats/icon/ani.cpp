@@ -60,27 +60,27 @@ struct AniChunks {
   std::vector<std::span<const uint8_t>> pictures;
 };
 
-void GatherPictures(std::span<const uint8_t> list, AniChunks& chunks) {
-  RiffWalk walk(list);
-  RiffPlace chunk;
-  while (chunks.pictures.size() < limits.animationFrames && walk.Next(chunk)) {
-    if (chunk.name == "icon") chunks.pictures.push_back(list.subspan(chunk.data, chunk.size));
-  }
-}
-
+// Lists are entered rather than skipped: some programs write a wrong length for the one with title
+// and author, which hides the rest of the file.
 AniChunks GatherChunks(std::span<const uint8_t> file) {
   AniChunks chunks;
   RiffWalk walk(file);
   RiffPlace chunk;
+  bool ofPictures = false;  // whether the last list is one of pictures
   while (walk.Next(chunk)) {
     const auto data = file.subspan(chunk.data, chunk.size);
     if (chunk.name == "anih") chunks.header = data;
     if (chunk.name == "rate") chunks.rates = data;
     if (chunk.name == "seq ") chunks.sequence = data;
-    // With its head the list is as long as a file's in front of the chunks.
-    static_assert(kListHead == kRiffHead);
-    if (chunk.name == "LIST" && ByteReader(data).Match("fram"))
-      GatherPictures(file.subspan(chunk.data - 8, chunk.size + 8), chunks);
+    if (chunk.name == "icon" && ofPictures && chunks.pictures.size() < limits.animationFrames)
+      chunks.pictures.push_back(data);
+    if (chunk.name == "LIST" && chunk.size >= 4) {
+      // The head of a list is as long as a file's: a walk from there begins with its first chunk.
+      static_assert(kListHead == kRiffHead);
+      ofPictures = ByteReader(data).Match("fram");
+      file = file.subspan(chunk.data - 8);
+      walk = RiffWalk(file);
+    }
   }
   return chunks;
 }
