@@ -6,6 +6,7 @@
 #include <algorithm>
 #include <cmath>
 
+#include "batch/picture_failure.h"
 #include "catalog/history/file_history.h"
 #include "core/text.h"
 #include "desktop/models/drawing/rgb_image.h"
@@ -287,7 +288,9 @@ std::string ViewFrame::StatusLine() const {
   } else if (picture.pageCount > 1) {
     line += ", " + Tr("page %1 of %2", page_ + 1, picture.pageCount);
   }
-  if (!note_.empty()) line += ". " + note_;
+  for (const std::string& note : {note_, MisnamedRemark(picture)}) {
+    if (!note.empty()) line += (line.ends_with('.') ? " " : ". ") + note;
+  }
   return line;
 }
 
