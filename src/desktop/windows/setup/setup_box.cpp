@@ -5,6 +5,7 @@
 #include <wx/filedlg.h>
 #include <wx/listbox.h>
 #include <wx/msgdlg.h>
+#include <wx/settings.h>
 #include <wx/simplebook.h>
 #include <wx/sizer.h>
 #include <wx/srchctrl.h>
@@ -98,10 +99,13 @@ SetupBox::SetupBox(wxWindow* parent, std::function<void()> applied, SetupPage fi
   column->Add(middle, wxSizerFlags(1).Expand());
   column->Add(BuildButtons(), wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, gap));
   SetSizer(column);
-  SetSize(TextWidth(*this, 980), TextWidth(*this, 680));
   SetMinSize(FromDIP(wxSize(760, 420)));
 
   FillSetupDialog(controls_, destinations_);
+  // Wide enough for the longest choice of every page, whatever the language.
+  const int pages =
+      ClientToWindowSize(column->CalcMin()).x + wxSystemSettings::GetMetric(wxSYS_VSCROLL_X, this);
+  SetSize(std::max(TextWidth(*this, 980), pages), TextWidth(*this, 680));
   TakeSetupChanged();
   ControlChanged();
   ShowPages();
