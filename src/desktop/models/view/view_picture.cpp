@@ -94,8 +94,10 @@ Status PrepareView(PicturePointer picture, ViewPicture& view) {
 }
 
 std::string SizeAndZoom(const PictureRecord& picture, double scale) {
-  return Tr("%1 x %2 pixels, %3, %4%", picture.image.Width(), picture.image.Height(),
-            SizeText(picture.fileSize, choice::kSizeFitting), std::lround(scale * 100));
+  std::string text = Tr("%1 x %2 pixels, %3, %4%", picture.image.Width(), picture.image.Height(),
+                        SizeText(picture.fileSize, choice::kSizeFitting), std::lround(scale * 100));
+  if (picture.shortfall != Status::Ok) text += std::string(", ") + Tr("incomplete file");
+  return text;
 }
 
 bool ViewPicture::HasChanged() const {

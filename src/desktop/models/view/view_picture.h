@@ -71,7 +71,7 @@ struct ViewPicture {
 // Shared between threads; nobody changes it once it is made.
 using ViewPicturePointer = std::shared_ptr<const ViewPicture>;
 
-// "4000 x 3000 pixels, 3.2 MB, 25%" of a picture at a scale.
+// "4000 x 3000 pixels, 3.2 MB, 25%" of a picture at a scale, and whether its file is incomplete.
 std::string SizeAndZoom(const PictureRecord& picture, double scale);
 
 // A decoded picture's pixels for other programs: on a background, 0x00BBGGRR, and in sRGB whatever

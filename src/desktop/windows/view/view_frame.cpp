@@ -281,7 +281,6 @@ std::string ViewFrame::StatusLine() const {
   if (shown->picture == nullptr) return line + ", " + StatusText(shown->status);
   const PictureRecord& picture = *shown->picture;
   line += ", " + SizeAndZoom(picture, canvas_->Zoom());
-  if (picture.shortfall != Status::Ok) line += std::string(", ") + Tr("incomplete file");
   if (turn_ != Orientation::Upright) line += std::string(", ") + Tr("rotated, not saved");
   if (animation_->Active()) {
     line += ", " + animation_->StatusText();
