@@ -6,6 +6,7 @@
 #include <map>
 
 #include "operations/engine.h"
+#include "processing/filters/mosaic.h"
 #include "processing/pictures.h"
 
 namespace fotomill::test {
@@ -212,6 +213,23 @@ TEST(Filters, RedEyesLoseTheirRedWithinTheAreaOnly) {
     for (int32_t x = 0; x < 6; ++x) {
       const bool healed = x == 2 && (y == 1 || y == 2);
       EXPECT_EQ(ColorAt(*picture, x, y), healed ? 0x282030u : ColorAt(*source, x, y)) << x << ", " << y;
+    }
+  }
+}
+
+TEST(Filters, OfAFaceOnlyPupilsLoseTheirRed) {
+  const auto color = [](int32_t x, int32_t y) {
+    const bool inSpot = x >= 25 && x < 33 && ((y >= 35 && y < 43) || (y >= 80 && y < 88));
+    const bool inStrip = y >= 20 && y < 24;  // wider than an eye
+    return inSpot || inStrip ? 0xd02030u : 0xd08068u;
+  };
+  const PicturePointer picture = MakePicture(100, 100, color);
+  const Rectangle face{0, 0, 100, 100};
+  ASSERT_EQ(RemoveRedEyesOfFace(*picture, face, face, 2.2), Status::Ok);
+  for (int32_t y = 0; y < 100; ++y) {
+    for (int32_t x = 0; x < 100; ++x) {
+      const bool healed = x >= 25 && x < 33 && y >= 35 && y < 43;
+      EXPECT_EQ(ColorAt(*picture, x, y), healed ? 0x282030u : color(x, y)) << x << ", " << y;
     }
   }
 }

@@ -267,13 +267,9 @@ Status RedEye(PictureRecord& picture, const Arguments& arguments, const Operatio
   if (!arguments.Flag("faces")) return RemoveRedEye(picture, area, ratio);
   std::vector<Rectangle> faces;
   RETURN_IF_BAD(FindFaces(picture.image, context.faces, faces, context.work.goesOn));
-  for (const Rectangle& face : faces) {
-    const int32_t left = std::max(face.x, area.x), top = std::max(face.y, area.y);
-    const int32_t right = std::min(face.x + face.width, area.x + area.width);
-    const int32_t bottom = std::min(face.y + face.height, area.y + area.height);
-    if (right > left && bottom > top)
-      RETURN_IF_BAD(RemoveRedEye(picture, {left, top, right - left, bottom - top}, ratio));
-  }
+  constexpr double kBeyondSkin = 0.6;  // pupils around which there is skin are told by more red
+  for (const Rectangle& face : faces)
+    RETURN_IF_BAD(RemoveRedEyesOfFace(picture, face, area, ratio + kBeyondSkin));
   return Status::Ok;
 }
 ArgumentProblem CheckRedEye(const Arguments& arguments) {

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <array>
+#include <vector>
 
 #include "processing/geometry/cut.h"
 #include "processing/padded_rows.h"
@@ -99,6 +100,38 @@ struct OilBand {
   }
 };
 
+// Where the eyes are in what the detector takes for a face, in per cent of its height.
+constexpr int64_t kEyesFrom = 15, kEyesTo = 60;
+
+struct Point {
+  int32_t x, y;
+};
+
+// Takes the marked pixels that hang together with the one at `start` off the mask. Whether they are
+// a compact spot: no side longer than `widest` or twice the other, and half of it filled.
+bool TakeSpot(PackedImage& mask, int32_t width, int32_t height, Point start, int32_t widest,
+              std::vector<Point>& spot) {
+  spot.assign(1, start);
+  mask.Row(start.y).data()[start.x] = 0;
+  Point least = start, most = start;
+  for (size_t i = 0; i < spot.size(); ++i) {
+    const Point at = spot[i];
+    least = {std::min(least.x, at.x), std::min(least.y, at.y)};
+    most = {std::max(most.x, at.x), std::max(most.y, at.y)};
+    for (const Point next : {Point{at.x - 1, at.y}, Point{at.x + 1, at.y}, Point{at.x, at.y - 1},
+                             Point{at.x, at.y + 1}}) {
+      if (next.x < 0 || next.y < 0 || next.x >= width || next.y >= height) continue;
+      uint8_t& mark = mask.Row(next.y).data()[next.x];
+      if (mark == 0) continue;
+      mark = 0;
+      spot.push_back(next);
+    }
+  }
+  const int32_t across = most.x - least.x + 1, down = most.y - least.y + 1;
+  return std::max(across, down) <= std::min(widest, 2 * std::min(across, down)) &&
+         2 * spot.size() >= static_cast<size_t>(across) * static_cast<size_t>(down);
+}
+
 }  // namespace
 
 Status MosaicPicture(PictureRecord& picture, const Rectangle& area, int32_t side,
@@ -139,6 +172,45 @@ Status RemoveRedEye(PictureRecord& picture, const Rectangle& area, double ratio)
     for (int32_t x = 0; x < seen.width; ++x, bgr += 3) {
       const int32_t others = bgr[0] + bgr[1];
       if (2 * bgr[2] > ratio * others) bgr[2] = static_cast<uint8_t>((others + 1) / 2);
+    }
+  }
+  return Status::Ok;
+}
+
+Status RemoveRedEyesOfFace(PictureRecord& picture, const Rectangle& face, const Rectangle& area,
+                           double ratio) {
+  if (picture.image.Empty()) return Status::EmptyImage;
+  RETURN_IF_BAD(PromotePicture(picture));
+  const auto part = [&](int64_t percent) {
+    return static_cast<int32_t>(face.height * percent / 100);
+  };
+  const int32_t left = std::max({face.x, area.x, 0});
+  const int32_t top = std::max({face.y + part(kEyesFrom), area.y, 0});
+  const int32_t right =
+      std::min({face.x + face.width, area.x + area.width, picture.image.Width()});
+  const int32_t bottom =
+      std::min({face.y + part(kEyesTo), area.y + area.height, picture.image.Height()});
+  if (right <= left || bottom <= top) return Status::Ok;
+  const int32_t width = right - left, height = bottom - top;
+  PackedImage mask;
+  RETURN_IF_BAD(NewAlphaPlane(width, height, mask));
+  for (int32_t y = 0; y < height; ++y) {
+    const uint8_t* bgr = picture.image.Row(top + y).data() + 3 * static_cast<size_t>(left);
+    uint8_t* const row = mask.Row(y).data();
+    for (int32_t x = 0; x < width; ++x, bgr += 3)
+      row[x] = bgr[2] > ratio * std::max(bgr[0], bgr[1]) ? 1 : 0;
+  }
+  const int32_t widest = std::max(face.width / 5, 2);
+  std::vector<Point> spot;
+  for (int32_t y = 0; y < height; ++y) {
+    for (int32_t x = 0; x < width; ++x) {
+      if (mask.Row(y).data()[x] == 0 || !TakeSpot(mask, width, height, {x, y}, widest, spot))
+        continue;
+      for (const Point& at : spot) {
+        uint8_t* const bgr =
+            picture.image.Row(top + at.y).data() + 3 * static_cast<size_t>(left + at.x);
+        bgr[2] = static_cast<uint8_t>((bgr[0] + bgr[1] + 1) / 2);
+      }
     }
   }
   return Status::Ok;

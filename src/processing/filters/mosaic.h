@@ -21,6 +21,12 @@ Status MosaicPicture(PictureRecord& picture, const Rectangle& area, int32_t side
 // and blue: their red becomes that mean.
 Status RemoveRedEye(PictureRecord& picture, const Rectangle& area, double ratio);
 
+// The same within a face, for what may be a pupil only: skin and lips are red too. That is a compact
+// spot, at most a fifth of the face wide, at the height of the eyes, whose pixels have more than
+// `ratio` times as much red as green and as blue. Only pixels within `area` are looked at.
+Status RemoveRedEyesOfFace(PictureRecord& picture, const Rectangle& face, const Rectangle& area,
+                           double ratio);
+
 // Each pixel becomes the mean of those in a square of 2 radius + 1 whose luma is in the most
 // frequent of `levels` ranges, the darkest of several. Edges repeat; a pixel counts by its alpha,
 // and alpha stays. Not in place.
