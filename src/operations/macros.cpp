@@ -1,10 +1,12 @@
 #include "operations/macros.h"
 
+#include <algorithm>
 #include <cstdio>
 #include <functional>
 #include <optional>
 
 #include "core/text.h"
+#include "core/utf8.h"
 #include "metadata/exif/exif_walk.h"
 #include "platform/clock.h"
 #include "platform/folders.h"
@@ -44,13 +46,52 @@ void Scan(std::string_view text, const std::function<void(std::string_view)>& ot
   }
 }
 
-// The text of the first tag of a name. "Date taken" is found as "datetaken" and "date-taken" too.
+// The field names of the standard, which people know from other programs, where our dictionary has
+// plainer ones. Source: CIPA DC-008-2012, sections 4.6.4 to 4.6.6.
+struct FieldName {
+  std::string_view name;  // in lower case
+  uint16_t tag;
+};
+constexpr FieldName kFieldNames[] = {
+    {"imagedescription", 0x010e}, {"make", 0x010f},
+    {"model", 0x0110},            {"orientation", 0x0112},
+    {"xresolution", 0x011a},      {"yresolution", 0x011b},
+    {"software", 0x0131},         {"datetime", 0x0132},
+    {"artist", 0x013b},           {"copyright", 0x8298},
+    {"exposuretime", 0x829a},     {"fnumber", 0x829d},
+    {"exposureprogram", 0x8822},  {"photographicsensitivity", 0x8827},
+    {"isospeedratings", 0x8827},  {"iso", 0x8827},
+    {"datetimeoriginal", 0x9003}, {"datetimedigitized", 0x9004},
+    {"shutterspeedvalue", 0x9201}, {"aperturevalue", 0x9202},
+    {"brightnessvalue", 0x9203},  {"exposurebiasvalue", 0x9204},
+    {"maxaperturevalue", 0x9205}, {"subjectdistance", 0x9206},
+    {"meteringmode", 0x9207},     {"lightsource", 0x9208},
+    {"flash", 0x9209},            {"focallength", 0x920a},
+    {"usercomment", 0x9286},      {"colorspace", 0xa001},
+    {"pixelxdimension", 0xa002},  {"pixelydimension", 0xa003},
+    {"exposuremode", 0xa402},     {"whitebalance", 0xa403},
+    {"digitalzoomratio", 0xa404}, {"focallengthin35mmfilm", 0xa405},
+    {"scenecapturetype", 0xa406}, {"contrast", 0xa408},
+    {"saturation", 0xa409},       {"sharpness", 0xa40a},
+    {"cameraownername", 0xa430},  {"bodyserialnumber", 0xa431},
+    {"lensmake", 0xa433},         {"lensmodel", 0xa434},
+    {"gpslatitude", 0x0002},      {"gpslongitude", 0x0004},
+    {"gpsaltitude", 0x0006},      {"gpstimestamp", 0x0007},
+};
+
+// The text of the first tag of a name: the dictionary's, or that of the standard. "Date taken" is
+// found as "datetaken" and "date-taken" too.
 class TagFinder : public ExifSink {
  public:
-  explicit TagFinder(std::string_view name) : name_(Plain(name)) {}
+  explicit TagFinder(std::string_view name) : name_(Plain(name)) {
+    for (const FieldName& field : kFieldNames) {
+      if (field.name == name_) tag_ = field.tag;
+    }
+  }
   void Directory(int32_t, std::string_view) override {}
   void Line(const ExifLine& line) override {
-    if (!found_ && Plain(line.name) == name_) found_ = std::string(line.text);
+    const bool named = tag_ == line.value.tag || Plain(line.name) == name_;
+    if (!found_ && named) found_ = std::string(line.text);
   }
   std::string Take() { return found_.value_or(std::string()); }
 
@@ -63,6 +104,7 @@ class TagFinder : public ExifSink {
     return plain;
   }
   const std::string name_;
+  std::optional<uint16_t> tag_;
   std::optional<std::string> found_;
 };
 
@@ -90,7 +132,8 @@ class DateFinder : public ExifSink {
     const int fields = std::sscanf(copy.c_str(), "%4d%*1[:-]%2d%*1[:-]%2d %2d:%2d:%2d", &time.year,
                                    &time.month, &time.day, &time.hour, &time.minute, &time.second);
     return fields >= 3 && time.year > 0 && time.month >= 1 && time.month <= 12 && time.day >= 1 &&
-           time.day <= 31;
+           time.day <= 31 && time.hour >= 0 && time.hour <= 23 && time.minute >= 0 &&
+           time.minute <= 59 && time.second >= 0 && time.second <= 60;
   }
   int rank_ = 3;
   platform::LocalTime time_;
@@ -148,6 +191,12 @@ std::string Expand(std::string_view text, const MacroFacts& facts, const Picture
   return expanded;
 }
 
+// The bytes of a macro that is none: the sign and the whole character behind it.
+size_t UnknownLength(std::string_view text) {
+  if (text.size() < 2) return text.size();
+  return 1 + std::max(CharacterLength(text.substr(1)), size_t{1});
+}
+
 }  // namespace
 
 std::string ExpandMacros(std::string_view text, const MacroFacts& facts,
@@ -175,7 +224,7 @@ RecordedText MacroProblem(std::string_view text) {
            problem = rest.starts_with("%E")
                          ? TrRecorded("needs the name of a tag in %E{Tag}")
                          : TrRecorded("has an unknown macro %1; %% is a percent sign",
-                                      rest.substr(0, 2));
+                                      rest.substr(0, UnknownLength(rest)));
          }
          return macro ? macro->length : 1;
        });

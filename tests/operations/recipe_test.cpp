@@ -70,6 +70,15 @@ TEST(Recipe, MistakesTellWhereAndWhatWasMeant) {
   }
 }
 
+TEST(Macros, TagsHaveTheNamesOfTheStandardToo) {
+  PictureRecord picture;
+  picture.metadata.exif = {'I', 'I', 42, 0, 8,   0,   0,   0, 1, 0, 0x10, 0x01, 2,
+                           0,   4,   0,  0, 0, 'C', 'a', 'm', 0, 0, 0,    0,    0};
+  for (const char* name : {"Model", "model", "Image input equipment model"})
+    EXPECT_EQ(ExpandMacros("%E{" + std::string(name) + "}", {}, picture), "Cam") << name;
+  EXPECT_EQ(ExpandMacros("%E{Make}", {}, picture), "");
+}
+
 TEST(Macros, AreExpandedAndMadeSafeForNames) {
   PictureRecord picture;
   picture.width = 30;
@@ -80,6 +89,7 @@ TEST(Macros, AreExpandedAndMadeSafeForNames) {
   EXPECT_TRUE(IsKnownEarly("%F-%N"));
   EXPECT_FALSE(IsKnownEarly("%F-%W"));
   EXPECT_EQ(MacroProblem("100%").english, "has an unknown macro %; %% is a percent sign");
+  EXPECT_EQ(MacroProblem("%\u00E9").english, "has an unknown macro %\u00E9; %% is a percent sign");
   EXPECT_EQ(MacroProblem("%E{}").english, "needs the name of a tag in %E{Tag}");
 }
 
