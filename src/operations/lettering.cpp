@@ -53,7 +53,7 @@ Status LetteringDrawing::Open(const Lettering& lettering, const std::string& tex
   lettering_ = lettering;
   lettering_.outline = std::min(lettering_.outline, lettering_.em);  // wider ones hide the letters
   RETURN_IF_BAD(font_.Open(lettering.font, lettering.em));
-  block_ = LayOutText(font_, WithLineFeeds(text), lettering.layout);
+  block_ = LayOutText(font_, text, lettering.layout);
   return Status::Ok;
 }
 

@@ -29,7 +29,7 @@ struct Lettering {
 // A lettering that is set and can be drawn.
 class LetteringDrawing {
  public:
-  // Sets a text, in which "\n" begins a new line. ResourceError without a font.
+  // Sets a text, in which a line feed begins a new line. ResourceError without a font.
   Status Open(const Lettering& lettering, const std::string& text);
 
   // What it covers, box and frame included, turned: whole pixels.

@@ -106,7 +106,7 @@ Status Caption(PictureRecord& picture, const Arguments& arguments,
   TextFont font;
   RETURN_IF_BAD(font.Open(style.font, style.em));
   const TextBlock block = LayOutText(
-      font, WithLineFeeds(context.Expanded(arguments.Text("text"), picture)), style.layout);
+      font, context.Expanded(WithLineFeeds(arguments.Text("text")), picture), style.layout);
   const double rows = block.height + 2 * around;
   if (rows + whole.height > 1e9) return Status::MemoryAllocationError;
   const auto height = static_cast<int32_t>(rows);
@@ -148,7 +148,8 @@ Status DrawText(PictureRecord& picture, const Arguments& arguments,
   const double around = style.box || style.frame > 0 ? style.padding + style.frame : 0;
   style.layout.width = std::max(whole.width - 2.0 * margin - 2 * around, 1.0);
   LetteringDrawing drawing;
-  RETURN_IF_BAD(drawing.Open(style, context.Expanded(arguments.Text("text"), picture)));
+  RETURN_IF_BAD(drawing.Open(
+      style, context.Expanded(WithLineFeeds(arguments.Text("text")), picture)));
   const Rectangle place =
       PlaceWithin(whole, drawing.Bounds(), arguments.Choice<Gravity>("gravity"), margin);
   const int32_t reach = drawing.Reach();

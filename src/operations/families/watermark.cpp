@@ -73,7 +73,7 @@ double Factor(double width, double height, Size whole, double share) {
 Status TextLayer(const PictureRecord& picture, const Arguments& arguments,
                  const OperationContext& context, PictureRecord& layer, int32_t& reach) {
   const Size whole{picture.image.Width(), picture.image.Height()};
-  const std::string text = context.Expanded(arguments.Text("text"), picture);
+  const std::string text = context.Expanded(WithLineFeeds(arguments.Text("text")), picture);
   Lettering style;
   style.font = arguments.Text("font");
   style.em = kTrialEm;
