@@ -26,6 +26,12 @@ namespace fotomill {
 
 namespace {
 
+// What operations return, with the reason if it is known.
+Status Worked(Status status, std::string& hint) {
+  if (status != Status::Ok) hint = WorkHint(status);
+  return status;
+}
+
 // The best quality whose file is small enough, found by writing temporary files.
 Status ChooseQuality(PictureRecord& picture, const OutputTarget& target, WriteOptions& write,
                      std::string& hint) {
@@ -75,7 +81,7 @@ Status OutputWriter::Prepare(PreparedOutput& output, std::string& hint) const {
       return Status::Ok;
     }
   }
-  if (target.output->transform) RETURN_IF_BAD(target.output->transform(picture));
+  if (target.output->transform) RETURN_IF_BAD(Worked(target.output->transform(picture), hint));
   const FormatEntry& row = FormatRow(target.formatIndex);
   const FitRequest fit{.keepsMetadata = KeepsMetadata(),
                        .turnsUpright = job_.turnsUpright,
@@ -193,8 +199,8 @@ Status OutputWriter::WriteFile(const PreparedOutput& output, const Destination& 
 Status OutputWriter::FitPage(PictureRecord& picture, const OutputTarget& target,
                              std::string& hint) const {
   if (function_.autoOrient) RETURN_IF_BAD(TurnUpright(picture));
-  if (function_.transform) RETURN_IF_BAD(function_.transform(picture));
-  if (target.output->transform) RETURN_IF_BAD(target.output->transform(picture));
+  if (function_.transform) RETURN_IF_BAD(Worked(function_.transform(picture), hint));
+  if (target.output->transform) RETURN_IF_BAD(Worked(target.output->transform(picture), hint));
   const FormatEntry& row = FormatRow(target.formatIndex);
   const FitRequest fit{.keepsMetadata = KeepsMetadata(),
                        .turnsUpright = job_.turnsUpright,

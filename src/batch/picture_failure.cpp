@@ -48,6 +48,13 @@ std::string OpenHint(const std::string& fileName, Status status) {
                                              : std::string();
 }
 
+std::string WorkHint(Status status) {
+  if (status == Status::ResourceError)
+    return Tr("No font was found; install one (package fonts-dejavu-core).");
+  if (status == Status::FeatureDisabled) return Tr("The face detector is not installed.");
+  return {};
+}
+
 std::string SizeHint(const PictureRecord& picture, const FormatEntry& row) {
   if (row.limits.Allow(picture.image.Width(), picture.image.Height())) return {};
   const char* text = row.limits.exact ? TrLater("The format only holds pictures of %1 x %2 pixels.")

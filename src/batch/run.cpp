@@ -151,7 +151,7 @@ class Batch {
     }
     if (function_.transform && !IsOnlyPlanned()) {
       if (const Status status = function_.transform(*picture); status != Status::Ok)
-        return {Failure(file, status)};
+        return {Failure(file, status, WorkHint(status))};
     }
     for (const size_t k : open) {
       ChoosePages(*picture, targets[k]);
@@ -212,11 +212,15 @@ class Batch {
     for (target.page = 1; target.page <= target.pages; ++target.page) {
       PicturePointer picture;
       Status status = Load(file.name, target.page, picture);
-      if (status == Status::Ok && function_.transform && !IsOnlyPlanned())
+      std::string hint;
+      if (status != Status::Ok) {
+        hint = LoadHint(file.name, status, picture.get());
+      } else if (function_.transform && !IsOnlyPlanned()) {
         status = function_.transform(*picture);
-      auto outcome = status == Status::Ok
-                         ? Produce(i, target, picture, true, held)
-                         : Failure(file, status, LoadHint(file.name, status, picture.get()));
+        hint = WorkHint(status);
+      }
+      auto outcome = status == Status::Ok ? Produce(i, target, picture, true, held)
+                                          : Failure(file, status, std::move(hint));
       if (!outcome) return false;
       outcome->output = target.output->label;
       outcomes.push_back(std::move(*outcome));

@@ -77,6 +77,20 @@ def reduced(work):
             expect(f"{source}: {line}: {apart} levels apart", apart <= 3)
 
 
+def hints(work):
+    """What operations lack is named, and the text of a macro is not read as one of the recipe."""
+    (work / "fonts.conf").write_text("<fontconfig></fontconfig>")
+    for steps, text in (("text x", "No font was found"), ("output a\n  caption x", "No font was found")):
+        environment = dict(os.environ, LC_ALL="C", FONTCONFIG_FILE=str(work / "fonts.conf"))
+        run = subprocess.run([FOTOMILL, "apply", work / "a.jpg", "--do", steps, "--dest", work / "none"], env=environment,
+                             capture_output=True, text=True, check=False)
+        expect(f"{steps}: {run.stderr}", run.returncode == 1 and text in run.stderr)
+    (work / "b\\n1.jpg").write_bytes((work / "a.jpg").read_bytes())
+    apply(work / "b\\n1.jpg", "--do", "caption %F", "--out", work / "one.png")
+    apply(work / "a.jpg", "--do", "caption x", "--out", work / "other.png")
+    expect("one line", Image.open(work / "one.png").size == Image.open(work / "other.png").size)
+
+
 with tempfile.TemporaryDirectory() as name:
     folder = Path(name)
     photo(1600, 1200).save(folder / "a.jpg", quality=90)
@@ -87,6 +101,7 @@ with tempfile.TemporaryDirectory() as name:
     outputs(folder)
     limits(folder)
     reduced(folder)
+    hints(folder)
 
 for fault in faults:
     print(fault)
