@@ -68,6 +68,7 @@ with tempfile.TemporaryDirectory() as name:
     (work / "broken.png").unlink()
     expect("turned", search(data, work, "--transforms"), [["a.png", "b.jpg", "c.bmp", "d.png"], ["e.png", "f.bmp"]])
     expect("exact", search(data, work, "--exact"), [["e.png", "f.bmp"]])
+    expect("named twice", search(data, work / "a.png", work / "a.png", work / "g.png"), [])
     expect("nothing", search(data, work / "a.png", work / "g.png"), [])
 
     # What the store knows is not read again: same size and time, other contents.

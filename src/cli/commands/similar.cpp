@@ -4,6 +4,7 @@
 #include <functional>
 #include <map>
 #include <memory>
+#include <set>
 #include <string>
 #include <utility>
 #include <vector>
@@ -61,7 +62,9 @@ class Search {
 
   int Run(const Selection& selection) {
     output_.CloseWith(selection.leftOut);
+    std::set<std::string> seen;  // a file that is named twice is not its own double
     for (const SelectedFile& file : selection.files) {
+      if (!seen.insert(platform::AbsolutePath(file.name)).second) continue;
       Candidate& candidate = candidates_.emplace_back();
       candidate.name = file.name;
       candidate.status = file.status;
