@@ -59,6 +59,7 @@ std::string KeyText(const Parameter& row, const KeyValues& keys) {
     const auto number = ParseNumber<int32_t>(text);
     text = number ? std::string(WordOf(row.keyWords, *number)) : std::string();
   }
+  if (row.kind == kFlag && (text == "0" || text == "1")) text = text == "1" ? "yes" : "no";
   Value value;
   return ReadValue(row, text, value).empty() ? text : std::string();
 }

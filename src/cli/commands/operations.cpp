@@ -68,7 +68,7 @@ std::string Padded(std::string_view text, size_t width) {
 
 std::string Number(double number) {
   char text[40];
-  std::snprintf(text, sizeof text, "%g", number);
+  std::snprintf(text, sizeof text, "%.10g", number);  // no exponents, which values cannot have
   return text;
 }
 

@@ -94,7 +94,7 @@ Status Enlarge(PictureRecord& picture, int32_t left, int32_t top, int32_t right,
   const int64_t width = int64_t{size.width} + left + right,
                 height = int64_t{size.height} + top + bottom;
   if (std::max(width, height) > INT32_MAX) return Status::MemoryAllocationError;
-  if (left + right + top + bottom == 0) return Status::Ok;
+  if (width == size.width && height == size.height) return Status::Ok;
   return PlaceOnCanvas(picture, {static_cast<int32_t>(width), static_cast<int32_t>(height)}, left,
                        top, BackdropOf(color));
 }
