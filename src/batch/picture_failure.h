@@ -22,8 +22,8 @@ std::string MisnamedRemark(const PictureRecord& picture);
 // to add.
 std::string OpenHint(const std::string& fileName, Status status);
 
-// What goes behind the message of a picture that operations failed on: what this system lacks. Empty
-// when there is nothing to add.
+// What goes behind the message of a picture that operations failed on: what this system lacks.
+// Empty when there is nothing to add.
 std::string WorkHint(Status status);
 
 // What size pictures of the row can have, if this one does not fit; empty if it does.

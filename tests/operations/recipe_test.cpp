@@ -72,7 +72,7 @@ TEST(Recipe, MistakesTellWhereAndWhatWasMeant) {
 
 TEST(Macros, TagsHaveTheNamesOfTheStandardToo) {
   PictureRecord picture;
-  picture.metadata.exif = {'I', 'I', 42, 0, 8,   0,   0,   0, 1, 0, 0x10, 0x01, 2,
+  picture.metadata.exif = {'I', 'I', 42, 0, 8, 0,   0,   0,   1, 0, 0x10, 0x01, 2,
                            0,   4,   0,  0, 0, 'C', 'a', 'm', 0, 0, 0,    0,    0};
   for (const char* name : {"Model", "model", "Image input equipment model"})
     EXPECT_EQ(ExpandMacros("%E{" + std::string(name) + "}", {}, picture), "Cam") << name;

@@ -148,8 +148,8 @@ Status DrawText(PictureRecord& picture, const Arguments& arguments,
   const double around = style.box || style.frame > 0 ? style.padding + style.frame : 0;
   style.layout.width = std::max(whole.width - 2.0 * margin - 2 * around, 1.0);
   LetteringDrawing drawing;
-  RETURN_IF_BAD(drawing.Open(
-      style, context.Expanded(WithLineFeeds(arguments.Text("text")), picture)));
+  RETURN_IF_BAD(
+      drawing.Open(style, context.Expanded(WithLineFeeds(arguments.Text("text")), picture)));
   const Rectangle place =
       PlaceWithin(whole, drawing.Bounds(), arguments.Choice<Gravity>("gravity"), margin);
   const int32_t reach = drawing.Reach();

@@ -186,8 +186,7 @@ Status RemoveRedEyesOfFace(PictureRecord& picture, const Rectangle& face, const 
   };
   const int32_t left = std::max({face.x, area.x, 0});
   const int32_t top = std::max({face.y + part(kEyesFrom), area.y, 0});
-  const int32_t right =
-      std::min({face.x + face.width, area.x + area.width, picture.image.Width()});
+  const int32_t right = std::min({face.x + face.width, area.x + area.width, picture.image.Width()});
   const int32_t bottom =
       std::min({face.y + part(kEyesTo), area.y + area.height, picture.image.Height()});
   if (right <= left || bottom <= top) return Status::Ok;

@@ -21,9 +21,9 @@ Status MosaicPicture(PictureRecord& picture, const Rectangle& area, int32_t side
 // and blue: their red becomes that mean.
 Status RemoveRedEye(PictureRecord& picture, const Rectangle& area, double ratio);
 
-// The same within a face, for what may be a pupil only: skin and lips are red too. That is a compact
-// spot, at most a fifth of the face wide, at the height of the eyes, whose pixels have more than
-// `ratio` times as much red as green and as blue. Only pixels within `area` are looked at.
+// The same within a face, for what may be a pupil only: skin and lips are red too. That is a
+// compact spot, at most a fifth of the face wide, at the height of the eyes, whose pixels have more
+// than `ratio` times as much red as green and as blue. Only pixels within `area` are looked at.
 Status RemoveRedEyesOfFace(PictureRecord& picture, const Rectangle& face, const Rectangle& area,
                            double ratio);
 
