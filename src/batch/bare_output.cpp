@@ -42,7 +42,11 @@ BareOutput MakeBareOutput(const PictureRecord& picture, bool upright) {
     }
   }
   const Status status = row.bare(turned.empty() ? file.Bytes() : turned, output.file);
-  if (status != Status::Ok || !file.Intact()) output.file.clear();
+  if (status != Status::Ok || !file.Intact()) {
+    output.file.clear();
+    output.asSource = true;
+    output.note = TrRecorded("It is not laid out as its format says, so it was encoded again.");
+  }
   return output;
 }
 

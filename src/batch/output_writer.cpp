@@ -57,6 +57,17 @@ Status ChooseQuality(PictureRecord& picture, const OutputTarget& target, WriteOp
   return status;
 }
 
+// How many pictures of a file that ends early can be had.
+size_t CountReadable(const ReadRequest& request) {
+  PageSource source;
+  if (source.Open(request) != Status::Ok) return 0;
+  PicturePointer page;
+  int32_t delayMs = 0;
+  size_t count = 0;
+  while (source.Next(page, delayMs) == Status::Ok) ++count;
+  return count;
+}
+
 Status WriteWhole(std::span<const uint8_t> bytes, const std::string& path,
                   const WriteOptions& options) {
   ByteWriter out;
@@ -231,18 +242,29 @@ Status OutputWriter::AddPage(SequenceWriter& sequence, PictureRecord& picture, i
 Status OutputWriter::WriteSequence(const PreparedOutput& output, const Destination& destination,
                                    const WriteOptions& options, std::string& hint) const {
   const FormatEntry& row = FormatRow(output.target.formatIndex);
+  const ReadRequest request{.fileName = std::string(output.picture.fileName.view()),
+                            .partial = function_.salvage,
+                            .stop = job_.stop.Token(),
+                            .options = job_.read};
   PageSource source;
-  RETURN_IF_BAD(source.Open({.fileName = std::string(output.picture.fileName.view()),
-                             .stop = job_.stop.Token(),
-                             .options = job_.read}));
+  RETURN_IF_BAD(source.Open(request));
+  size_t count = source.Count();
+  if (function_.salvage) {
+    count = CountReadable(request);
+    if (count < source.Count()) output.picture.shortfall = Status::FileReadError;
+  }
+  if (count == 0) return Status::FileReadError;
   SequencePointer sequence;
   const SequenceFacts facts{
-      .count = source.Count(), .animated = source.Animated(), .rounds = source.Rounds()};
+      .count = count, .animated = source.Animated(), .rounds = source.Rounds()};
   RETURN_IF_BAD(row.sequence(destination.path, facts, options, sequence));
   PicturePointer page;
   int32_t delayMs = 0;
-  for (size_t i = 0; i < source.Count(); ++i) {
-    RETURN_IF_BAD(source.Next(page, delayMs));
+  for (size_t i = 0; i < count; ++i) {
+    const Status status = source.Next(page, delayMs);
+    if (status == Status::FileReadError) hint = function_.salvageHint;
+    RETURN_IF_BAD(status);
+    if (page->shortfall != Status::Ok) output.picture.shortfall = page->shortfall;
     RETURN_IF_BAD(FitPage(*page, output.target, hint));
     RETURN_IF_BAD(AddPage(*sequence, *page, delayMs, output.target, hint));
     if (job_.stop.Token().Asked()) return Status::FunctionCancelled;
@@ -259,7 +281,10 @@ RecordedText OutputWriter::Note(const PreparedOutput& output) const {
   if (!output.file.empty()) return note;
   const bool frames =
       picture.formatIndex != kNoFormat && FormatRow(picture.formatIndex).animate != nullptr;
-  const bool chosen = function_.page > 0 || output.allPages;
+  const OutputTarget& target = output.target;
+  // a dry run has not made the output
+  const bool all = output.allPages || target.sequence || OnlyDropsMetadata(picture, target);
+  const bool chosen = function_.page > 0 || target.page > 0 || all;
   note.Append(LeftOut(picture, {.metadataWanted = KeepsMetadata(),
                                 .pages = chosen ? 0 : picture.pageCount - 1,
                                 .frames = frames,

@@ -20,7 +20,9 @@ Status PageSource::Open(const ReadRequest& request) {
   count_ = static_cast<size_t>(facts_->pageCount);
   const FormatEntry& row = FormatRow(facts_->formatIndex);
   if (row.animate == nullptr) return Status::Ok;
-  RETURN_IF_BAD(row.animate(request_, animation_));
+  ReadRequest whole = request_;  // a frame that is cut short would not be told from others
+  whole.partial = false;
+  RETURN_IF_BAD(row.animate(whole, animation_));
   count_ = animation_->Delays().size();
   return Status::Ok;
 }

@@ -32,6 +32,9 @@ namespace {
 constexpr const char* kNoName = TrLater("The name would be empty or contain a folder.");
 constexpr const char* kTooLong = TrLater("The path would be longer than 260 characters.");
 
+constexpr const char* kOneFile =
+    TrLater("Its pages would be several files; choose one with --page.");
+
 // Whether names are settled by more than a look at the folder.
 bool AsksEveryName(const BatchJob& job) {
   if (job.formatIndex == kNoFormat)
@@ -156,6 +159,7 @@ class Batch {
     for (const size_t k : open) {
       ChoosePages(*picture, targets[k]);
       if (targets[k].pages > 0) {
+        if (function_.oneFile) return {Failure(file, Status::UnsuitableImage, Tr(kOneFile))};
         if (!ProduceNumbered(i, targets[k], held, outcomes)) return {};
         continue;
       }
@@ -181,7 +185,7 @@ class Batch {
     destination.path = target.path;
     if (target.path.empty() || target.path.size() > PathText::Capacity()) {
       outcome = Failure(file, Status::InvalidDestination, target.path.empty() ? kNoName : kTooLong);
-    } else if (IsLeftOut(i, destination)) {
+    } else if (function_.page != kAllPages && IsLeftOut(i, destination)) {
       outcome = Skipped(file, destination);
     } else {
       return false;

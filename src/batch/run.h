@@ -42,6 +42,8 @@ struct BatchFunction {
            // but nothing in front of names that an output makes itself
   // not empty: the whole path of the output of a selection of one
   std::string out = {};
+  // that path is all there is, such as a stream: pages in several files fail with UnsuitableImage
+  bool oneFile = false;
   // of files with several, from 1, or kAllPages; 0: all frames where an animation becomes one, else
   // the first page
   int32_t page = 0;

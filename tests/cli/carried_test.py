@@ -483,6 +483,26 @@ def animations(folder):
     check(len(one) == 1 and far(one[0][0], drawn(2, True)) == 0, "a frame that was asked for")
     run("convert", folder / "source.png", "-o", folder / "two.bmp", "--page", "2")
     check((folder / "two.bmp").exists(), "a frame of an animated PNG")
+    # files that end within the last frame, or before one that they claim
+    for source, cut in (("gif", 20), ("png", 60), ("png", 12)):
+        path, made = folder / f"cut.{source}", folder / "cut_made.webp"
+        data = (folder / f"source.{source}").read_bytes()
+        if cut == 12:
+            cut = len(data) - data.rindex(b"fcTL") + 4
+        path.write_bytes(data[:-cut])
+        result = run("convert", path, "-o", made, "--overwrite", "replace")
+        check(result.returncode == 1 and not made.exists() and "Use --salvage" in result.stderr, f"{path.name} without {cut} bytes: {result.stderr}")
+        check(run("verify", path).returncode == 1, f"verify {path.name} without {cut} bytes")
+        result = run("convert", path, "-o", made, "--salvage")
+        check(result.returncode == 0 and "The file is incomplete" in result.stderr and len(frames_of(made)[0]) == 3, f"salvaged {path.name} without {cut} bytes: {result.stderr}")
+        made.unlink(missing_ok=True)
+    result = run("convert", folder / "source.gif", "-o", folder / "never.gif", "--dry-run")
+    check(result.returncode == 0 and result.stderr == "One file was processed.\n", f"a dry run leaves no frames out: {result.stderr}")
+    frames[0].save(folder / "said.gif", save_all=True, append_images=frames[1:], comment=b"hello")
+    run("convert", folder / "said.gif", "-o", folder / "again.gif")
+    check(Image.open(folder / "again.gif").info.get("comment") == b"hello", "a GIF's comment")
+    result = run("convert", folder / "said.gif", "-o", folder / "said.webp")
+    check("Left out: comment." in result.stderr, f"a GIF's comment is left out: {result.stderr}")
 
 
 def pages(folder):
@@ -498,12 +518,21 @@ def pages(folder):
                 made.seek(i)
                 check(difference(made, sheets[i]) == 0, f"page {i + 1} of {to}")
     result = run("convert", folder / "doc.tif", "-t", "png", "--page", "all", "-d", folder / "out")
+    check("Left out" not in result.stderr, f"nothing is left out: {result.stderr}")
     names = sorted(p.name for p in (folder / "out").iterdir())
     check(names == [f"doc-{i:02}.png" for i in range(1, 12)], f"numbered pages: {names}")
     for i, name in enumerate(names):
         check(difference(Image.open(folder / "out" / name), sheets[i]) == 0, f"{name} is its page")
     result = run("convert", folder / "doc.tif", "-t", "png", "--page", "all", "-d", folder / "out")
     check((folder / "out" / "doc-03 [1].png").exists() and len(list((folder / "out").iterdir())) == 22, "numbered names are kept apart")
+    (folder / "out2" / "doc.png").touch()
+    for _ in range(2):
+        run("convert", folder / "doc.tif", "-t", "png", "--page", "all", "-d", folder / "out2", "--overwrite", "skip")
+        check(len(list((folder / "out2").iterdir())) == 12, "numbered names decide what is skipped")
+    result = run("convert", folder / "doc.tif", "-t", "png", "--page", "all", "-o", "-")
+    check(result.returncode == 1 and result.stdout == "" and "choose one with --page" in result.stderr, f"pages into a stream: {result.stderr}")
+    result = run("convert", folder / "doc.tif", "-t", "png", "-o", folder / "out")
+    check(result.returncode == 2 and "is a folder; end its name with /" in result.stderr, f"a folder as --out: {result.stderr}")
     run("convert", folder / "app.ico", "-o", folder / "again.ico", "--page", "all")
     with Image.open(folder / "again.ico") as made:
         check(made.info["sizes"] == {(16, 16), (32, 32), (64, 64)}, f"all icons: {made.info.get('sizes')}")

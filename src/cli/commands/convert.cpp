@@ -81,7 +81,9 @@ BatchFunction FunctionOf(const ConvertOptions& options, const Recipe* recipe) {
                          .reduce = options.reduce,
                          .reduceHint = Tr("Use --reduce to reduce them."),
                          .salvage = options.salvage,
-                         .salvageHint = Tr("Use --salvage to convert what is there."),
+                         .salvageHint = options.salvage
+                                            ? std::string()
+                                            : Tr("Use --salvage to convert what is there."),
                          .autoOrient = options.autoOrient,
                          .keepMetadata = options.metadata == "keep",
                          .keepTimes = options.keepTimes,
@@ -175,6 +177,8 @@ std::string CheckOptions(const ConvertOptions& options, const CommandContext& co
       !platform::IsFolder(options.dest)) {
     return Tr("\"%1\" is not a folder.", options.dest);
   }
+  if (!options.out.empty() && options.out != kStream && platform::IsFolder(options.out))
+    return Tr("\"%1\" is a folder; end its name with / to write into it.", options.out);
   return {};
 }
 
@@ -281,6 +285,7 @@ int RunConvert(ConvertOptions options, const CommandContext& context) {
     }
     output.ShowAsStream(stream.Path());
     function.out = stream.Path();
+    function.oneFile = true;
   }
   return RunInto(stream, *selection, function, job, output, context);
 }

@@ -35,6 +35,7 @@
 #include <algorithm>
 #include <cstring>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "core/byte_reader.h"
@@ -61,7 +62,9 @@ bool KeepsPalette(const GifScreen& screen, const GifFrame& frame, int32_t page) 
 Status DescribePicture(ByteReader& bytes, int32_t page, GifScreen& screen, GifFrame& frame,
                        PictureRecord& picture) {
   RETURN_IF_BAD(ParseScreen(bytes, screen));
-  RETURN_IF_BAD(NextFrame(bytes, screen, frame));
+  GifRemarks remarks;
+  RETURN_IF_BAD(NextFrame(bytes, screen, frame, &remarks));
+  picture.comment = std::move(remarks.comment);
   if (screen.width < 1 || screen.height < 1 || frame.width < 1 || frame.height < 1)
     return Status::DamagedFile;
   const bool keepsPalette = KeepsPalette(screen, frame, page);

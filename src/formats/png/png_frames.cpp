@@ -88,22 +88,26 @@ class PngAnimation final : public Animation {
     width_ = facts.width;
     height_ = facts.height;
     RETURN_IF_BAD(CheckFileMemory(3 * PackedRowBytes(width_, height_, 24)));
-    Collect(static_cast<size_t>(facts.pageCount));
+    Collect(static_cast<size_t>(facts.pageCount), request.partial);
     for (const PngFrame& frame : frames_) delays_.push_back(frame.delayMs);
     return CheckPackedSize(width_, height_, 24);
   }
 
  private:
   // Takes the chunks in front of the pixels, and the frames' places; without frames the picture is
-  // the only one.
-  void Collect(size_t frames) {
+  // the only one. Where the file ends before its last frame, one without data stands for those that
+  // are missing.
+  void Collect(size_t frames, bool partial) {
     PngChunks chunks(file_.Bytes());
     PngFrame still{.width = width_, .height = height_};
     bool open = false;  // data belong to the last frame
+    bool ended = false;
+    uint32_t claimed = 0;
     for (PngChunk chunk; chunks.Next(chunk);) {
+      ended = chunk.type == "IEND";
       if (chunk.type == "acTL") {
         ByteReader bytes(chunk.data);
-        bytes.Skip(4);
+        claimed = bytes.Be32();
         plays_ = static_cast<int32_t>(std::min<uint32_t>(bytes.Be32(), INT32_MAX));
       } else if (chunk.type == "fcTL") {
         PngFrame frame;
@@ -119,7 +123,12 @@ class PngAnimation final : public Animation {
       }
     }
     std::erase_if(frames_, [](const PngFrame& frame) { return frame.data.empty(); });
-    if (frames == 1 || frames_.empty()) frames_.assign(1, std::move(still));
+    const bool cut = !ended && !partial && frames_.size() < claimed;
+    if (frames == 1 || frames_.empty()) {
+      frames_.assign(1, std::move(still));
+    } else if (cut) {
+      frames_.emplace_back();
+    }
     rounds_ = plays_;
   }
 
@@ -137,6 +146,7 @@ class PngAnimation final : public Animation {
     if (index == 0) RETURN_IF_BAD(NewCanvas(width_, height_, canvas_));
     if (index > 0) Dispose(frames_[index - 1]);
     const PngFrame& frame = frames_[index];
+    if (index > 0 && frame.data.empty()) return Status::FileReadError;
     PictureRecord picture;
     picture.stop = stop_;
     RETURN_IF_BAD(DecodePng(FileOf(frame), options_, picture));
