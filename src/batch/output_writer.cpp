@@ -16,6 +16,7 @@
 #include "platform/reason.h"
 #include "platform/temporary_file.h"
 #include "platform/volumes.h"
+#include "processing/color/color_profile.h"
 #include "processing/flatten.h"
 #include "processing/palette/reduce.h"
 #include "registry/registry.h"
@@ -99,11 +100,17 @@ Status OutputWriter::Prepare(PreparedOutput& output, std::string& hint) const {
                        .profile = function_.profile};
   const bool upright = OrientationOf(picture) == Orientation::Upright;
   const bool profile = !picture.metadata.icc.empty();
+  const ProfileColors colors = ColorsOfProfile(picture.metadata.icc);
   RETURN_IF_BAD(FitPicture(picture, row, fit, hint));
   if (!upright && OrientationOf(picture) == Orientation::Upright)
     output.detail.Append(TrRecorded("Turned upright."));
-  if (profile && picture.metadata.icc.empty())
-    output.detail.Append(TrRecorded("Colors converted to sRGB."));
+  if (profile && picture.metadata.icc.empty()) {
+    if (colors == ProfileColors::Rgb || colors == ProfileColors::Gray) {
+      output.detail.Append(TrRecorded("Colors converted to sRGB."));
+    } else {  // of other colors than the pixels, or no profile at all
+      output.note.Append(TrRecorded("Its color profile does not suit it and was left out."));
+    }
+  }
   // frames keep what is transparent where a single picture is flattened
   const uint32_t keeps = target.sequence ? FMT_ALPHA | FMT_TRANSPARENT : FMT_ALPHA;
   output.transparency =
