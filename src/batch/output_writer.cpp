@@ -1,5 +1,6 @@
 #include "batch/output_writer.h"
 
+#include <algorithm>
 #include <span>
 #include <utility>
 
@@ -83,7 +84,7 @@ Status OutputWriter::Prepare(PreparedOutput& output, std::string& hint) const {
   PictureRecord& picture = output.picture;
   const OutputTarget& target = output.target;
   if (OnlyDropsMetadata(picture, target)) {
-    BareOutput bare = MakeBareOutput(picture, job_.turnsUpright);
+    BareOutput bare = MakeBareOutput(picture, TurnsUpright());
     output.file = std::move(bare.file);
     output.asSource = bare.asSource;
     output.note = std::move(bare.note);
@@ -96,7 +97,7 @@ Status OutputWriter::Prepare(PreparedOutput& output, std::string& hint) const {
   if (target.output->transform) RETURN_IF_BAD(Worked(target.output->transform(picture), hint));
   const FormatEntry& row = FormatRow(target.formatIndex);
   const FitRequest fit{.keepsMetadata = KeepsMetadata(),
-                       .turnsUpright = job_.turnsUpright,
+                       .turnsUpright = TurnsUpright(),
                        .profile = function_.profile};
   const bool upright = OrientationOf(picture) == Orientation::Upright;
   const bool profile = !picture.metadata.icc.empty();
@@ -121,6 +122,13 @@ Status OutputWriter::Prepare(PreparedOutput& output, std::string& hint) const {
   const auto deepest = static_cast<int32_t>(row.maxBits);
   return picture.bitsPerPixel <= deepest ? Status::Ok
                                          : ReduceColors(picture, deepest, job_.reduction);
+}
+
+bool OutputWriter::TurnsItself() const {
+  return !function_.keepMetadata && !function_.transform &&
+         std::ranges::none_of(function_.outputs, [](const BatchOutput& output) {
+           return static_cast<bool>(output.transform);
+         });
 }
 
 // Whether all that is asked for is a file without metadata in the format of the source.
@@ -221,7 +229,7 @@ Status OutputWriter::FitPage(PictureRecord& picture, const OutputTarget& target,
   if (target.output->transform) RETURN_IF_BAD(Worked(target.output->transform(picture), hint));
   const FormatEntry& row = FormatRow(target.formatIndex);
   const FitRequest fit{.keepsMetadata = KeepsMetadata(),
-                       .turnsUpright = job_.turnsUpright,
+                       .turnsUpright = TurnsUpright(),
                        .profile = function_.profile};
   RETURN_IF_BAD(FitPicture(picture, row, fit, hint));
   if ((row.flags & (FMT_ALPHA | FMT_TRANSPARENT)) == 0) RETURN_IF_BAD(FlattenAlpha(picture));

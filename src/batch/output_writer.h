@@ -47,11 +47,16 @@ class OutputWriter {
   // Names what of the source a written output does not have; empty for nothing.
   RecordedText Note(const PreparedOutput& output) const;
 
+  // Whether Prepare turns pictures that are to be upright: those that lose their metadata and
+  // nothing else, as their files may be turned without loss.
+  bool TurnsItself() const;
+
  private:
   // Whether the folder of an output is made if it is missing.
   bool MakesFolder(const Destination& destination, const OutputTarget& target) const;
   bool Reduces(const OutputTarget& target) const { return function_.reduce || target.kept; }
   bool KeepsMetadata() const { return function_.keepMetadata && job_.encode.preserveMetadata; }
+  bool TurnsUpright() const { return job_.turnsUpright || function_.autoOrient; }
   bool OnlyDropsMetadata(const PictureRecord& picture, const OutputTarget& target) const;
   Status FitPage(PictureRecord& picture, const OutputTarget& target, std::string& hint) const;
   Status AddPage(SequenceWriter& sequence, PictureRecord& picture, int32_t delayMs,

@@ -297,7 +297,8 @@ class Batch {
     request.page = picture->page = page - 1;
     if (IsOnlyPlanned()) return page > picture->pageCount ? Status::NoImages : Status::Ok;
     RETURN_IF_BAD(ReadPicture(request, *picture));
-    return function_.autoOrient ? TurnUpright(*picture) : Status::Ok;
+    const bool turns = function_.autoOrient && !writer_.TurnsItself();
+    return turns ? TurnUpright(*picture) : Status::Ok;
   }
 
   std::string LoadHint(const std::string& name, Status status, const PictureRecord* picture) const {

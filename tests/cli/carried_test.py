@@ -501,6 +501,12 @@ def animations(folder):
     frames[0].convert("RGB").save(folder / "junk.jpg", icc_profile=b"no profile" * 20)
     result = run("convert", folder / "junk.jpg", "-o", folder / "junk.bmp", "-v")
     check("does not suit it and was left out." in result.stderr and "converted" not in result.stderr, f"a profile that is none: {result.stderr}")
+    for name in ("on.jpg", "on.png", "on.webp", "on.tif"):
+        scene(60, 40).save(folder / name, exif=exif(6))
+        for adjust in (0, 1):
+            made = folder / f"up{adjust}{name}"
+            run("--set", f"ExifAdjustOrientation={adjust}", "convert", folder / name, "-o", made, "--auto-orient", "--metadata", "strip")
+            check(Image.open(made).size == (40, 60), f"{name} stripped and upright: {Image.open(made).size}")
     frames[0].save(folder / "said.gif", save_all=True, append_images=frames[1:], comment=b"hello")
     run("convert", folder / "said.gif", "-o", folder / "again.gif")
     check(Image.open(folder / "again.gif").info.get("comment") == b"hello", "a GIF's comment")
