@@ -507,6 +507,9 @@ def animations(folder):
             made = folder / f"up{adjust}{name}"
             run("--set", f"ExifAdjustOrientation={adjust}", "convert", folder / name, "-o", made, "--auto-orient", "--metadata", "strip")
             check(Image.open(made).size == (40, 60), f"{name} stripped and upright: {Image.open(made).size}")
+    scene().convert("CMYK").save(folder / "inks.jpg")
+    result = run("convert", folder / "inks.jpg", "-o", folder / "inks.png")
+    check("Left out: inks or further channels." in result.stderr, f"inks of a JPEG: {result.stderr}")
     frames[0].save(folder / "said.gif", save_all=True, append_images=frames[1:], comment=b"hello")
     run("convert", folder / "said.gif", "-o", folder / "again.gif")
     check(Image.open(folder / "again.gif").info.get("comment") == b"hello", "a GIF's comment")

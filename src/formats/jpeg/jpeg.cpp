@@ -76,7 +76,7 @@ void TakeMetadata(const JpegReader& reader, PictureRecord& picture) {
   PictureMetadata& metadata = picture.metadata;
   metadata = {};
   picture.comment.clear();
-  picture.unread = 0;
+  picture.unread = IsCmyk(info) ? kUnreadInks : uint8_t{0};
   for (const JpegSegment& segment : reader.segments) {
     const std::string_view data = DataOf(segment);
     if (segment.marker == kApp13) {
