@@ -69,6 +69,8 @@ BatchFile StandardInput::Take(const Io& io, const std::string& from) {
     const auto count = ReadPiece(io, buffer);
     if (!count) return Failed(Status::FileReadError, ReasonSentence());
     const std::span<const uint8_t> piece = std::span(buffer).first(*count);
+    if (total == 0 && piece.empty())
+      return Failed(Status::FileReadError, Tr("Standard input is empty."));
     if (total == 0) {
       const auto head = piece.first(std::min(piece.size(), kSignatureBytes));
       const std::string extension = from.empty() ? ExtensionOfContents(head) : from;
