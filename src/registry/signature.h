@@ -18,7 +18,9 @@ struct FileKind {
   bool IsOf(std::string_view extension) const;
 };
 
-inline constexpr size_t kSignatureBytes = 32;  // so many from the start of a file decide
+// So many bytes from the start of a file decide: the first 32, and as many behind the 512 that
+// precede a Macintosh picture.
+inline constexpr size_t kSignatureBytes = 512 + 32;
 
 // Recognises a file by its first kSignatureBytes bytes (fewer when it is shorter), by the longest
 // signature that fits.

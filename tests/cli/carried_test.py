@@ -325,6 +325,8 @@ def left_out(folder):
         check(result.returncode == 0 and lines == wanted, f"{source} to {to}: {result.stderr}")
     result = run("convert", folder / "pages.tif", "-o", folder / "left.png", "--page", "2", "--overwrite", "replace")
     check("Left out" not in result.stderr, "a page that was chosen leaves nothing out")
+    result = run("convert", folder / "pages.tif", "-o", folder / "left.png", "--page", "all", "--overwrite", "replace")
+    check("Left out" not in result.stderr, "all pages as numbered files leave nothing out")
     result = run("convert", folder / "camera.jpg", "-o", folder / "left.bmp", "--metadata", "strip", "--overwrite", "replace")
     check("Left out" not in result.stderr, "what was to be dropped is not missed")
     result = run("convert", folder / "camera.jpg", "-o", folder / "left.bmp", "--overwrite", "replace", "-q")

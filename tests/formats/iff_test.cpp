@@ -127,5 +127,14 @@ TEST(IffWrite, ObeysItsKeys) {
   EXPECT_EQ(kindOf(), "PBM  8 0");
 }
 
+// Rows of hold and modify begin with the first color; for some readers that is black.
+TEST(IffWrite, FirstColorOfHamIsBlack) {
+  const Bytes file = Encode(HamWrite, *PatternPicture(33, 5, 24));
+  const std::string_view text(reinterpret_cast<const char*>(file.data()), file.size());
+  const size_t place = text.find("CMAP");
+  ASSERT_NE(place, std::string_view::npos);
+  EXPECT_EQ(text.substr(place + 8, 3), std::string_view("\0\0\0", 3));
+}
+
 }  // namespace
 }  // namespace fotomill::test

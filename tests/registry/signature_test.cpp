@@ -8,6 +8,12 @@
 namespace fotomill::test {
 namespace {
 
+std::vector<uint8_t> Behind(size_t zeros, const std::vector<uint8_t>& bytes) {
+  std::vector<uint8_t> all(zeros);
+  all.insert(all.end(), bytes.begin(), bytes.end());
+  return all;
+}
+
 TEST(Signature, KnowsFilesWhateverTheirName) {
   const struct {
     std::vector<uint8_t> head;
@@ -21,6 +27,9 @@ TEST(Signature, KnowsFilesWhateverTheirName) {
       {Hex("52 49 46 46  00 00 00 00  58 58 58 58"), ""},         // a container of something else
       {Hex("49 49 2A 00 10 00 00 00 43 52 02 00"), "Canon CR2"},  // a TIFF by its first bytes
       {Hex("49 49 2A 00 08 00 00 00"), "TIFF"},
+      {Hex("49 49 55 00 18 00 00 00"), "Panasonic RW2"},
+      {Behind(522, Hex("00 11 02 FF 0C 00")), "a Macintosh picture"},
+      {Behind(521, Hex("00 11 02 FF 0C 00")), ""},
       {Hex("42 4D 36 10 0E 00 00 00 00 00 36 00"), "BMP"},
       {Hex("42 4D 36 10 0E 00 01 00 00 00 36 00"), ""},  // reserved fields in use: text that begins with BM
       {Hex("42 4D"), ""},                                // too short to tell
@@ -53,6 +62,8 @@ TEST(Signature, OfFiles) {
   const TemporaryFolder folder;
   WriteBytes(folder.Path("x.bin"), Hex("47 49 46 38 39 61"));
   EXPECT_EQ(IdentifyFile(folder.Path("x.bin")).name, "GIF");
+  WriteBytes(folder.Path("drawing.pict"), Behind(522, Hex("00 11 02 FF 0C 00")));
+  EXPECT_EQ(IdentifyFile(folder.Path("drawing.pict")).name, "a Macintosh picture");
   EXPECT_EQ(IdentifyFile(folder.Path("none")).name, "");
   EXPECT_EQ(IdentifyFile(folder.Path()).name, "");
 }

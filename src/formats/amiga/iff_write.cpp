@@ -37,18 +37,21 @@ class HamEncoder {
     RETURN_IF_BAD(cells.Open());
     for (int32_t y = 0; y < image.Height(); ++y) cells.AddRow(image.Row(y).data(), image.Width());
     ColorPoints points;
-    RETURN_IF_BAD(FitPalette(cells.Bins(), kHamColors, points));
-    palette_ = PaletteOf(points);
+    RETURN_IF_BAD(FitPalette(cells.Bins(), kHamColors - 1, points));
+    // Rows begin with the first color, as the hardware has it. Some readers begin with black, so
+    // the first color is black.
+    palette_ = {};
+    std::ranges::copy_n(PaletteOf(points).begin(), 3 * points.count, palette_.begin() + 3);
     nearest_ = std::make_unique<NearestColor>();
     RETURN_IF_BAD(nearest_->Open(true));
-    nearest_->SetColors(PointsOf(palette_, points.count));
+    nearest_->SetColors(PointsOf(palette_, points.count + 1));
     return Status::Ok;
   }
 
   const Palette& Colors() const { return palette_; }
 
   void EncodeRow(std::span<const uint8_t> bgr, std::span<uint8_t> pixels) {
-    uint8_t color[3] = {palette_[2], palette_[1], palette_[0]};
+    uint8_t color[3] = {};
     for (size_t x = 0; x < pixels.size(); ++x) pixels[x] = EncodePixel(&bgr[3 * x], color);
   }
 
