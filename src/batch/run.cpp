@@ -304,7 +304,8 @@ class Batch {
   std::string LoadHint(const std::string& name, Status status, const PictureRecord* picture) const {
     if (picture == nullptr || status != Status::NoImages || function_.page <= picture->pageCount) {
       const std::string hint = OpenHint(name, status);
-      return hint.empty() && status == Status::FileReadError ? function_.salvageHint : hint;
+      const bool tellsSalvage = status == Status::FileReadError && !function_.salvage;
+      return hint.empty() && tellsSalvage ? function_.salvageHint : hint;
     }
     return TrCount("The file has only one page.", "The file has only %1 pages.",
                    static_cast<uint64_t>(picture->pageCount));

@@ -379,6 +379,7 @@ def salvages(folder):
         path.write_bytes(data[:len(data) // 100 if name != "cut.tif" else 300])
         result = run("convert", path, "-o", made, "--overwrite", "replace", "--salvage")
         check(result.returncode in (0, 1) and not result.stderr.startswith("Traceback"), f"{name} without pixels: {result.returncode}")
+        check("Use --salvage" not in result.stderr, f"{name}: what was tried is not proposed: {result.stderr}")
 
 
 def codecs(folder):
