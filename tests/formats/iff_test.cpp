@@ -125,6 +125,10 @@ TEST(IffWrite, ObeysItsKeys) {
   EXPECT_EQ(kindOf(), "ILBM 4 0");
   settings.CreateIffPBM = 1;
   EXPECT_EQ(kindOf(), "PBM  8 0");
+  // The padding of rows of odd width repeats the last pixel.
+  picture->image.Row(4)[16] = 0x90;  // two pixels a byte
+  const Bytes file = Encode(IffWrite, *picture);
+  EXPECT_EQ(Bytes(file.end() - 2, file.end()), Hex("09 09"));
 }
 
 // Rows of hold and modify begin with the first color; for some readers that is black.

@@ -164,6 +164,9 @@ class StoredRows {
     }
     if (layout_.packed) {
       std::ranges::copy(pixels, row_.begin());
+      // Padding that repeats the last pixel packs into its run. As a run of its own, some readers
+      // would take it for the next row.
+      row_.back() = pixels.back();
     } else {
       SplitIffPlanes(pixels, PlaneSize(), layout_.planes, row_.data());
     }
