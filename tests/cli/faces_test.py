@@ -1,4 +1,4 @@
-#!/usr/bin/env python3
+#!/usr/bin/python3
 """Faces: where they are found, and what is cut, corrected and framed by them. The faces are drawn here; the detector takes
 them for real ones. Left out where the detector or Pillow is not there."""
 import json

@@ -1,4 +1,4 @@
-#!/usr/bin/env python3
+#!/usr/bin/python3
 """Every command line of docs/jobs.md works as it stands, one after the other, and leaves something to see."""
 import os
 import subprocess

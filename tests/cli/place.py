@@ -65,8 +65,8 @@ class Place:
     def names(self, folder="."):
         return sorted(path.name for path in (self.path / folder).iterdir())
 
-    def start(self, *arguments, stdin=subprocess.DEVNULL, **more):
-        return subprocess.Popen([PROGRAM, *arguments], cwd=self.path, stdin=stdin, stdout=subprocess.PIPE, stderr=subprocess.PIPE,
+    def start(self, *arguments, stdin=subprocess.DEVNULL, stdout=subprocess.PIPE, **more):
+        return subprocess.Popen([PROGRAM, *arguments], cwd=self.path, stdin=stdin, stdout=stdout, stderr=subprocess.PIPE,
                                 env=self.environment, **self.user, **more)
 
     def run_bytes(self, *arguments, given=None, **more):

@@ -163,8 +163,10 @@ def readers_that_go():
             (["rename", "--undo"], 0, None),
         ]
         for arguments, status, folder in rows:
-            process = place.start(*arguments)
-            process.stdout.close()
+            reader, writer = os.pipe()
+            os.close(reader)  # before the program begins, however fast it is
+            process = place.start(*arguments, stdout=writer)
+            os.close(writer)
             err = process.stderr.read().decode()
             process.stderr.close()
             check(process.wait(60), status, f"{arguments}: {err}")

@@ -22,12 +22,12 @@ namespace {
 
 // Everything is bound now, so that a missing symbol fails here and not inside a picture; nothing of
 // it serves others.
-void* Open(const char* name, std::string& error) {
+void* Open(const char* name, std::string& error, int flags = 0) {
   if (FaultDue()) {
     error = "cannot be loaded";
     return nullptr;
   }
-  void* handle = dlopen(name, RTLD_NOW | RTLD_LOCAL);
+  void* handle = dlopen(name, RTLD_NOW | RTLD_LOCAL | flags);
   if (handle == nullptr) {
     const char* text = dlerror();
     error = text != nullptr ? text : "cannot be loaded";
@@ -106,7 +106,9 @@ bool SharedLibrary::LoadSystem(const std::string& name) {
   if (name.empty() || name.find('/') != std::string::npos) {
     error_ = "not a bare name";
   } else {
-    handle_ = Open(name.c_str(), error_);
+    // It stays until the program ends: what such a library keeps for itself is not lost, and nothing of
+    // it is called after it went.
+    handle_ = Open(name.c_str(), error_, RTLD_NODELETE);
   }
   return Loaded();
 }
