@@ -51,7 +51,8 @@ def wrong_uses():
         place.files("a.bmp", "b.bmp")
         whole = bitmap(30, 30)
         rows = [
-            (["convert", "-", "--to", "pcx"], b"", 1, "-: Unsupported format. Name the format with --from."),
+            (["convert", "-", "--to", "pcx"], b"", 1, "-: File read error. Standard input is empty."),
+            (["convert", "-", "--to", "pcx"], b"no picture at all", 1, "-: Unsupported format. Name the format with --from."),
             (["info", "-"], b"\0\0\0\x1cftypavif" + bytes(20), 1, "It looks like AVIF. Name the format with --from."),
             (["convert", "-", "--to", "pcx"], whole[:300], 1, "-: "),
             (["convert", "-", "-", "--to", "pcx"], whole, 2, "only once"),

@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include "batch/new_job.h"
 #include "picture/encode_options.h"
 #include "picture/read_request.h"
 #include "registry/registry.h"
@@ -18,7 +19,7 @@ TEST(JobOptions, DefaultsAreThoseOfTheSettings) {
   EXPECT_EQ(EncodeOptionsFromSettings(), EncodeOptions());
 }
 
-// Every key that Setup shows for a format reaches its codec.
+// Every key that Setup shows for a format reaches its codec or the batch.
 TEST(JobOptions, HoldEveryKeyOfTheFormats) {
   for (const FormatSettings* const codec : SettingsOfFormats()) {
     for (const FormatSetting& setting : codec->keys) {
@@ -27,6 +28,7 @@ TEST(JobOptions, HoldEveryKeyOfTheFormats) {
       const ScopedSettings keep;
       const EncodeOptions encode = EncodeOptionsFromSettings();
       const ReadOptions read = ReadOptionsFromSettings();
+      const auto everyPage = NewBatchJob().everyPage;
       const KeyRow* const row = FindKey(setting.key);
       ASSERT_NE(row, nullptr);
       if ((row->type & KEY_TEXT) != 0) {
@@ -34,7 +36,8 @@ TEST(JobOptions, HoldEveryKeyOfTheFormats) {
       } else {
         StoreNumber(*row, NumberIn(*row) == 0 ? 1 : 0);
       }
-      EXPECT_TRUE(EncodeOptionsFromSettings() != encode || ReadOptionsFromSettings() != read);
+      EXPECT_TRUE(EncodeOptionsFromSettings() != encode || ReadOptionsFromSettings() != read ||
+                  NewBatchJob().everyPage != everyPage);
     }
   }
 }
