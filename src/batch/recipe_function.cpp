@@ -59,8 +59,8 @@ FileFunction FunctionOfFamily(Family family) {
 
 std::string SetRecipe(std::shared_ptr<const Recipe> recipe, const std::string& copyrightHolder,
                       const BatchJob& job, const FormatLookup& lookup, BatchFunction& function) {
-  const auto run = std::make_shared<RecipeRun>(
-      RecipeRun{recipe, copyrightHolder, job.faces, function.jobs == 1 ? 1u : 0u, job.stop.Token()});
+  const auto run = std::make_shared<RecipeRun>(RecipeRun{
+      recipe, copyrightHolder, job.faces, function.jobs == 1 ? 1u : 0u, job.stop.Token()});
   function.transform = [run](PictureRecord& picture) {
     return run->Apply(picture, run->recipe->common);
   };

@@ -78,7 +78,8 @@ struct FontFiles::List {
     const std::string_view kind = reinterpret_cast<const char*>(format);
     if (kind != "TrueType" && kind != "CFF") return;
     (void)fontconfig->FcPatternGetInteger(font, FC_INDEX, 0, &index);
-    entries.push_back({{reinterpret_cast<const char*>(path), index & kCollectionIndex}, characters});
+    entries.push_back(
+        {{reinterpret_cast<const char*>(path), index & kCollectionIndex}, characters});
   }
 
   ~List() {
@@ -95,7 +96,8 @@ size_t FontFiles::Count() const { return list_->entries.size(); }
 const FontFile& FontFiles::At(size_t index) const { return list_->entries[index].file; }
 
 bool FontFiles::Has(size_t index, char32_t character) const {
-  return list_->fontconfig->FcCharSetHasChar(list_->entries[index].characters, character) != FcFalse;
+  return list_->fontconfig->FcCharSetHasChar(list_->entries[index].characters, character) !=
+         FcFalse;
 }
 
 std::shared_ptr<const FontFiles> FontFiles::Of(std::string_view family) {

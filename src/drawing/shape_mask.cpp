@@ -10,8 +10,8 @@ ShapeCoverage::ShapeCoverage(const Shape& shape)
     : shape_(shape),
       cosine_(std::cos(shape.angle * std::numbers::pi / 180)),
       sine_(std::sin(shape.angle * std::numbers::pi / 180)),
-      radius_(std::clamp(shape.radius, 0.0, std::max(std::min(shape.width, shape.height), 0.0) / 2)) {
-}
+      radius_(
+          std::clamp(shape.radius, 0.0, std::max(std::min(shape.width, shape.height), 0.0) / 2)) {}
 
 uint8_t ShapeCoverage::At(int32_t x, int32_t y) const {
   const double dx = x + 0.5 - shape_.x, dy = y + 0.5 - shape_.y;

@@ -14,8 +14,8 @@ struct Shape {
   double radius = 0;    // of the corners; more than half an edge counts as half of it
 };
 
-// How much of each pixel a shape covers. Edges along pixels are sharp, others smooth over one pixel.
-// Source: the signed distance of a rounded box, I. Quilez, "2D distance functions".
+// How much of each pixel a shape covers. Edges along pixels are sharp, others smooth over one
+// pixel. Source: the signed distance of a rounded box, I. Quilez, "2D distance functions".
 class ShapeCoverage {
  public:
   explicit ShapeCoverage(const Shape& shape);

@@ -114,8 +114,9 @@ Status DrawTextBlock(const TextFont& font, const TextBlock& block, const LinePla
   const double left = -block.width / 2, top = -block.height / 2;
   for (size_t i = 0; i < block.lines.size(); ++i) {
     const double room = block.width - block.lines[i].width / kFraction;
-    const double across =
-        left + (block.align == TextAlign::Left ? 0 : block.align == TextAlign::Center ? room / 2 : room);
+    const double across = left + (block.align == TextAlign::Left     ? 0
+                                  : block.align == TextAlign::Center ? room / 2
+                                                                     : room);
     const double down = top + block.ascent + static_cast<double>(i) * block.step;
     LinePlace place = center;
     place.x = center.x + across * cosine - down * sine;

@@ -23,9 +23,9 @@ class TextFont {
   TextFont(const TextFont&) = delete;
   TextFont& operator=(const TextFont&) = delete;
 
-  // Opens the font of a family ("Arial", "DejaVu Sans Bold") with an em of so many pixels. Where the
-  // system has no such family, another one takes its place. ResourceError if there is no font, or
-  // what shapes text is not installed.
+  // Opens the font of a family ("Arial", "DejaVu Sans Bold") with an em of so many pixels. Where
+  // the system has no such family, another one takes its place. ResourceError if there is no font,
+  // or what shapes text is not installed.
   Status Open(std::string_view family, double em);
   // The same so that its lines are `height` pixels high, from the top of the tallest letters to the
   // bottom of the deepest.

@@ -23,7 +23,8 @@ struct TextLine {
 struct LinePlace {
   double x = 0, y = 0;  // the start of the baseline, in pixels from the mask's top left corner
   double angle = 0;     // of the baseline about that point: degrees, clockwise
-  double stroke = 0;    // 0: the letters; else a band along their edges, so many pixels to each side
+  // 0: the letters; else a band along their edges, so many pixels to each side
+  double stroke = 0;
 };
 
 }  // namespace fotomill

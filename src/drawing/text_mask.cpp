@@ -136,7 +136,8 @@ class LineDrawing {
     params.flags = FT_RASTER_FLAG_AA | FT_RASTER_FLAG_DIRECT | FT_RASTER_FLAG_CLIP;
     params.gray_spans = AddSpans;
     params.user = &mask_;
-    params.clip_box = {0, 0, std::min(mask_.Width(), kFarthest), std::min(mask_.Height(), kFarthest)};
+    params.clip_box = {0, 0, std::min(mask_.Width(), kFarthest),
+                       std::min(mask_.Height(), kFarthest)};
     return FT_Outline_Render(fonts_.Library(), &outline, &params) == 0
                ? Status::Ok
                : Status::MemoryAllocationError;

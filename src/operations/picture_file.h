@@ -10,8 +10,8 @@
 namespace fotomill {
 
 // The picture that a parameter names: a name without a folder is looked for in the current folder,
-// then in the data folder. Upright as its EXIF says, of 24 bits, with its alpha plane if it has one.
-// The last one is kept, so that a batch decodes its logo once. From any thread. Statuses as
+// then in the data folder. Upright as its EXIF says, of 24 bits, with its alpha plane if it has
+// one. The last one is kept, so that a batch decodes its logo once. From any thread. Statuses as
 // LoadPicture.
 Status LoadPictureFile(const std::string& name, std::shared_ptr<const PictureRecord>& picture);
 

@@ -24,7 +24,8 @@ PicturePointer Landscape(int32_t width, int32_t height, int32_t seed, int32_t br
     double level = 120 + brighter;
     for (int32_t wave = 1; wave < 9; ++wave) {
       const double phase = Scatter(seed, wave) % 628 / 100.0;
-      level += 14 * std::sin(u * (Scatter(wave, seed) % 20) + v * (Scatter(seed + 7, wave) % 20) + phase);
+      level += 14 * std::sin(u * (Scatter(wave, seed) % 20) + v * (Scatter(seed + 7, wave) % 20) +
+                             phase);
     }
     const auto gray = static_cast<uint32_t>(std::clamp(level, 0.0, 255.0));
     return gray << 16 | gray << 8 | gray / 2;
@@ -65,11 +66,13 @@ TEST(PictureHash, KnowsAllWaysToTurnAPicture) {
 }
 
 TEST(PictureHash, DigestsSeePixelsOnly) {
-  const auto picture = MakePicture(20, 10, [](int32_t x, int32_t) { return x < 9 ? 0x000000u : 0xffffffu; });
+  const auto picture =
+      MakePicture(20, 10, [](int32_t x, int32_t) { return x < 9 ? 0x000000u : 0xffffffu; });
   std::string own, other;
   ASSERT_EQ(DigestPixels(*picture, own), Status::Ok);
   EXPECT_EQ(own.size(), 32u);
-  const auto packed = MakePicture(20, 10, [](int32_t x, int32_t) { return x < 9 ? 0x000000u : 0xffffffu; });
+  const auto packed =
+      MakePicture(20, 10, [](int32_t x, int32_t) { return x < 9 ? 0x000000u : 0xffffffu; });
   bool done = false;
   ASSERT_EQ(PackFewColors(*packed, 1, done), Status::Ok);
   ASSERT_TRUE(done);
@@ -83,12 +86,14 @@ TEST(PictureHash, DigestsSeePixelsOnly) {
 
 std::vector<PictureHashes> Plain(std::initializer_list<PictureHash> hashes) {
   std::vector<PictureHashes> all;
-  for (const PictureHash hash : hashes) all.push_back({hash, ~hash, ~hash, ~hash, ~hash, ~hash, ~hash, ~hash});
+  for (const PictureHash hash : hashes)
+    all.push_back({hash, ~hash, ~hash, ~hash, ~hash, ~hash, ~hash, ~hash});
   return all;
 }
 
 TEST(SimilarGroups, AreLinkedWithinTheLimit) {
-  const auto pictures = Plain({0, 0xffffffff00000000, 0x7, 0x3f, 0xffffffff00000001, 0xaaaaaaaaaaaaaaaa, 0xffffffff00000000});
+  const auto pictures = Plain({0, 0xffffffff00000000, 0x7, 0x3f, 0xffffffff00000001,
+                               0xaaaaaaaaaaaaaaaa, 0xffffffff00000000});
   const struct {
     int32_t most;
     std::vector<std::vector<size_t>> groups;
@@ -145,7 +150,8 @@ TEST(SimilarGroups, OfAHundredThousandTakeSeconds) {
   for (int32_t i = 0; i < 100000; ++i) {
     PictureHashes hashes{};
     for (size_t way = 0; way < hashes.size(); ++way)
-      hashes[way] = PictureHash{Scatter(i, static_cast<int32_t>(way))} << 32 | Scatter(static_cast<int32_t>(way), -i);
+      hashes[way] = PictureHash{Scatter(i, static_cast<int32_t>(way))} << 32 |
+                    Scatter(static_cast<int32_t>(way), -i);
     if (i % 4 == 0) hashes[0] = 12345;  // plain pictures look alike
     pictures.push_back(hashes);
   }

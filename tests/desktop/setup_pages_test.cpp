@@ -110,7 +110,8 @@ TEST(SetupHelp, EntriesArePlainTextAndEndWhereTheNextBegins) {
 TEST(OverrideOptions, BelongToFormatsThatAreWritten) {
   for (const FormatSettings* const options : SettingsOfFormats()) {
     SCOPED_TRACE(options->box);
-    const bool written = CanWrite(FormatRow(FindFormatByName("a." + std::string(options->extension))));
+    const bool written =
+        CanWrite(FormatRow(FindFormatByName("a." + std::string(options->extension))));
     EXPECT_EQ(FindOverrideOptions(options->extension), written ? options : nullptr);
     EXPECT_EQ(ItemsOf(*options).size(), options->keys.size()) << "every option is a row of Setup";
   }

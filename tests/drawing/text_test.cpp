@@ -127,7 +127,8 @@ TEST(TextMask, TurnsStrokesAndClips) {
   EXPECT_NEAR(edges.bounds.width, flat.bounds.width + 8, 2);
   EXPECT_NEAR(edges.bounds.height, flat.bounds.height + 8, 2);
   EXPECT_GT(edges.pixels, flat.pixels);
-  for (const auto& [x, y] : {std::pair{-20.0, 10.0}, {190.0, 100.0}, {50.0, 210.0}, {50.0, -1e6}, {1e8, 1e8}}) {
+  for (const auto& [x, y] :
+       {std::pair{-20.0, 10.0}, {190.0, 100.0}, {50.0, 210.0}, {50.0, -1e6}, {1e8, 1e8}}) {
     const Ink cut = Drawn(font, "HE", {x, y}, {200, 200});
     EXPECT_LT(cut.pixels, flat.pixels) << x << " " << y;
   }
@@ -159,7 +160,8 @@ TEST(TextBlock, BreaksLinesWhereTheyMayEnd) {
     for (size_t i = 0; i < row.lines.size(); ++i)
       EXPECT_EQ(block.lines[i].width, font.Shape(row.lines[i]).width) << i;
   }
-  const TextBlock one = LayOutText(font, "x", {}), two = LayOutText(font, "x\nx", {.lineSpacing = 7});
+  const TextBlock one = LayOutText(font, "x", {}),
+                  two = LayOutText(font, "x\nx", {.lineSpacing = 7});
   EXPECT_EQ(two.height, one.height + one.step + 7);
 }
 

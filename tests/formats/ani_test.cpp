@@ -13,7 +13,8 @@ using Bytes = std::vector<uint8_t>;
 
 std::string Hex32(uint32_t value) {
   char text[16];
-  std::snprintf(text, sizeof text, "%02X%02X%02X%02X ", value & 255, value >> 8 & 255, value >> 16 & 255, value >> 24);
+  std::snprintf(text, sizeof text, "%02X%02X%02X%02X ", value & 255, value >> 8 & 255,
+                value >> 16 & 255, value >> 24);
   return text;
 }
 std::string Chunk(const std::string& name, const std::string& hex) {
@@ -21,23 +22,28 @@ std::string Chunk(const std::string& name, const std::string& hex) {
   return name + Hex32(static_cast<uint32_t>(size)) + hex + (size % 2 != 0 ? " 00 " : " ");
 }
 
-const std::string kAnih = "616E6968 ", kRate = "72617465 ", kSeq = "73657120 ", kList = "4C495354 ", kIcon = "69636F6E ";
+const std::string kAnih = "616E6968 ", kRate = "72617465 ", kSeq = "73657120 ", kList = "4C495354 ",
+                  kIcon = "69636F6E ";
 
 // A cursor of `width` opaque pixels of one color, one row high.
 std::string Cursor(int width, const char* bgr) {
   std::string row;
   for (int i = 0; i < width; ++i) row += bgr;
   while (Hex(row).size() % 4 != 0) row += "00";
-  return "0000 0200 0100  01 01 00 00 0500 0700 FFFFFFFF 16000000  28000000 " + Hex32(static_cast<uint32_t>(width)) +
-         "02000000 0100 1800 00000000 00000000 00000000 00000000 00000000 00000000 " + row + " 00000000 ";
+  return "0000 0200 0100  01 01 00 00 0500 0700 FFFFFFFF 16000000  28000000 " +
+         Hex32(static_cast<uint32_t>(width)) +
+         "02000000 0100 1800 00000000 00000000 00000000 00000000 00000000 00000000 " + row +
+         " 00000000 ";
 }
 
 std::string Header(uint32_t pictures, uint32_t rate, uint32_t flags = 1) {
-  return Chunk(kAnih, Hex32(36) + Hex32(pictures) + Hex32(9) + Hex32(0) + Hex32(0) + Hex32(0) + Hex32(0) + Hex32(rate) + Hex32(flags));
+  return Chunk(kAnih, Hex32(36) + Hex32(pictures) + Hex32(9) + Hex32(0) + Hex32(0) + Hex32(0) +
+                          Hex32(0) + Hex32(rate) + Hex32(flags));
 }
 // Pictures of 2, 1 and 3 pixels: red, green, blue.
-const std::string kPictures = Chunk(kList, "6672616D " + Chunk(kIcon, Cursor(2, "0000FF")) + Chunk(kIcon, Cursor(1, "00FF00")) +
-                                               Chunk(kIcon, Cursor(3, "FF0000")));
+const std::string kPictures =
+    Chunk(kList, "6672616D " + Chunk(kIcon, Cursor(2, "0000FF")) +
+                     Chunk(kIcon, Cursor(1, "00FF00")) + Chunk(kIcon, Cursor(3, "FF0000")));
 
 Bytes File(const std::string& chunks) { return Hex("52494646 FFFFFF7F 41434F4E " + chunks); }
 
@@ -53,7 +59,8 @@ std::string Played(const Bytes& file, Status* end = nullptr) {
     const Status status = animation->Next();
     if (end != nullptr) *end = status;
     if (status != Status::Ok) break;
-    text += std::to_string(delay) + ": " + PixelText(animation->Frame().image) + " " + PixelText(animation->Frame().alpha) + "\n";
+    text += std::to_string(delay) + ": " + PixelText(animation->Frame().image) + " " +
+            PixelText(animation->Frame().alpha) + "\n";
   }
   EXPECT_EQ(animation->Rounds(), 0);
   return text;
@@ -89,7 +96,8 @@ TEST(Ani, StepsArePlayedAsTheChunksSay) {
 
 TEST(Ani, PagesAreSteps) {
   const TemporaryFolder folder;
-  WriteBytes(folder.Path("a.ani"), File(Header(3, 6) + Chunk(kSeq, Hex32(2) + Hex32(0)) + kPictures));
+  WriteBytes(folder.Path("a.ani"),
+             File(Header(3, 6) + Chunk(kSeq, Hex32(2) + Hex32(0)) + kPictures));
   const std::pair<int32_t, int32_t> pages[] = {{0, 3}, {1, 2}};
   for (const auto& [page, width] : pages) {
     const PicturePointer picture = NewPictureRecord();

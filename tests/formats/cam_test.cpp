@@ -18,7 +18,8 @@ Bytes Coded(const std::string& digits) {
   for (size_t i = 0; i < digits.size(); i += 8) {
     uint8_t byte = 0;
     for (size_t bit = 0; bit < 8; ++bit)
-      byte = static_cast<uint8_t>(byte << 1 | (i + bit < digits.size() ? digits[i + bit] - '0' : 1));
+      byte =
+          static_cast<uint8_t>(byte << 1 | (i + bit < digits.size() ? digits[i + bit] - '0' : 1));
     bytes.push_back(byte);
     if (byte == 0xFF) bytes.push_back(0);
   }
@@ -51,11 +52,13 @@ Bytes Quantizers() {
 }
 
 Bytes NormalArea() {
-  const Bytes y = Coded(Luma("100", 60 * 30)), cb = Coded(Chroma("100", 20 * 15)), cr = Coded(Chroma("011", 20 * 15));
+  const Bytes y = Coded(Luma("100", 60 * 30)), cb = Coded(Chroma("100", 20 * 15)),
+              cr = Coded(Chroma("011", 20 * 15));
   Bytes area = Hex("0003");
   for (const Bytes* scan : {&y, &cb, &cr}) Append16(area, scan->size());
   const Bytes quantizers = Quantizers();
-  for (const Bytes* part : {&quantizers, &y, &cb, &cr}) area.insert(area.end(), part->begin(), part->end());
+  for (const Bytes* part : {&quantizers, &y, &cb, &cr})
+    area.insert(area.end(), part->begin(), part->end());
   return area;
 }
 
@@ -101,8 +104,12 @@ TEST(CamRead, Pictures) {
   Bytes whole = File({{1, comment}, {2, thumbnail}, {3, normal}});
   Bytes cutNormal = whole;
   cutNormal.resize(cutNormal.size() - 2000);
-  const Bytes jpeg = Hex("FFD8 FFDB 0043 00 40404040404040404040404040404040404040404040404040404040404040404040404040404040404040404040404040"
-                         "404040404040404040404040404040 FFC0 000B 08 0008 0008 01 01 11 00 FFDA 0008 01 01 00 00 3F 00 92BF FFD9");
+  const Bytes jpeg =
+      Hex("FFD8 FFDB 0043 00 "
+          "4040404040404040404040404040404040404040404040404040404040404040404040404040404040404040"
+          "4040404040"
+          "404040404040404040404040404040 FFC0 000B 08 0008 0008 01 01 11 00 FFDA 0008 01 01 00 00 "
+          "3F 00 92BF FFD9");
   struct Row {
     const char* name;
     Bytes file;

@@ -21,7 +21,8 @@ constexpr uint32_t kEnd = 0xFFFFFFFE, kFree = 0xFFFFFFFF;
 // 4, 6, 5, and those from 7 on a stream of 5000 bytes.
 Bytes File() {
   Bytes file(Sector(14));
-  const Bytes head = Hex("D0CF11E0A1B11AE1 00000000000000000000000000000000 3E00 0300 FEFF 0900 0600");
+  const Bytes head =
+      Hex("D0CF11E0A1B11AE1 00000000000000000000000000000000 3E00 0300 FEFF 0900 0600");
   std::ranges::copy(head, file.begin());
   Put(file, 44, 1);
   Put(file, 48, 1);
@@ -31,7 +32,8 @@ Bytes File() {
   Put(file, 68, kEnd);
   for (size_t i = 0; i < 109; ++i) Put(file, 76 + 4 * i, i == 0 ? 0 : kFree);
   const uint32_t next[] = {0xFFFFFFFD, kEnd, kEnd, kEnd, 6, 7, 5, 8, 9, 10, 11, 12, 13, kEnd};
-  for (size_t i = 0; i < 128; ++i) Put(file, Sector(0) + 4 * i, i < std::size(next) ? next[i] : kFree);
+  for (size_t i = 0; i < 128; ++i)
+    Put(file, Sector(0) + 4 * i, i < std::size(next) ? next[i] : kFree);
   struct Entry {
     const char* name;
     uint8_t kind;

@@ -16,7 +16,8 @@ std::string Header(const char* planes, const char* size, const char* words = "00
   return std::string("0001 ") + words + planes + " 0002 0174 0174 " + size + "  ";
 }
 // A color table of XIMG for four colors.
-const std::string kFour = "58494D47 0000  03E8 03E8 03E8  03E8 0000 0000  0000 01F4 0000  0000 0000 0000  ";
+const std::string kFour =
+    "58494D47 0000  03E8 03E8 03E8  03E8 0000 0000  0000 01F4 0000  0000 0000 0000  ";
 
 TEST(Gem, ReadsItsKinds) {
   const std::string two = " 80 02 55 33 ";  // a line of two planes of a byte each
@@ -132,12 +133,14 @@ TEST(Gem, EncodesLines) {
 
 TEST(Gem, WritesWhatOthersRead) {
   const PicturePointer mono = PatternPicture(9, 3, 1);
-  for (int32_t i = 0; i < 27; ++i) SetPixel(mono->image, i % 9, i / 9, i % 9 != 0);  // black at the left
+  // black at the left
+  for (int32_t i = 0; i < 27; ++i) SetPixel(mono->image, i % 9, i / 9, i % 9 != 0);
   EXPECT_EQ(Encode(GemWrite, *mono), Hex("0001 0008 0001 0001 0174 0174 0009 0003  00 00 FF 03  80 02 80 00"));
   mono->palette[0] = 255;  // red: it needs a palette
   const Bytes red = Encode(GemWrite, *mono);
-  EXPECT_EQ(Bytes(red.begin(), red.begin() + 34),
-            Hex("0001 0011 0001 0001 0174 0174 0009 0003 58494D47 0000 03E8 0000 0000 03E8 03E8 03E8"));
+  EXPECT_EQ(
+      Bytes(red.begin(), red.begin() + 34),
+      Hex("0001 0011 0001 0001 0174 0174 0009 0003 58494D47 0000 03E8 0000 0000 03E8 03E8 03E8"));
   const PicturePointer color = PatternPicture(3, 1, 24);
   for (int32_t x = 0; x < 3; ++x) SetPixel(color->image, x, 0, 0x010203);
   EXPECT_EQ(Encode(GemWrite, *color), Hex("0001 0008 0018 0003 0174 0174 0003 0001  00 03 01 02 03"));

@@ -63,7 +63,8 @@ class TiffFile {
  private:
   static uint32_t Width(uint16_t type) { return type == 1 || type == 2 ? 1 : type == 3 ? 2 : 4; }
   void Put(Bytes& bytes, uint32_t value, uint32_t width) const {
-    for (uint32_t i = 0; i < width; ++i) bytes.push_back(static_cast<uint8_t>(value >> 8 * (big_ ? width - 1 - i : i)));
+    for (uint32_t i = 0; i < width; ++i)
+      bytes.push_back(static_cast<uint8_t>(value >> 8 * (big_ ? width - 1 - i : i)));
   }
   uint32_t Values(const Entry& entry) {
     const uint32_t width = Width(entry.type);
@@ -129,19 +130,23 @@ Bytes PreviewFile(bool big, bool jpeg) {
   if (jpeg) {
     const Bytes small = Jpeg(24), large = Jpeg(40);
     const uint32_t first = file.Data(small), second = file.Data(large);
-    next = file.Directory({{259, 3, {6}}, {513, 4, {first}}, {514, 4, {static_cast<uint32_t>(small.size())}}});
-    const uint32_t best = file.Directory({{259, 3, {7}}, {273, 4, {second}}, {279, 4, {static_cast<uint32_t>(large.size())}}});
+    next = file.Directory(
+        {{259, 3, {6}}, {513, 4, {first}}, {514, 4, {static_cast<uint32_t>(small.size())}}});
+    const uint32_t best = file.Directory(
+        {{259, 3, {7}}, {273, 4, {second}}, {279, 4, {static_cast<uint32_t>(large.size())}}});
     below = best;
   }
-  std::vector<TiffFile::Entry> entries = {{256, 4, {2}}, {257, 3, {1}}, {258, 3, {8}}, {259, 3, {1}},
-                                          {262, 3, {2}}, {273, 4, {rgb}}, {277, 3, {3}}, {279, 4, {6}}};
+  std::vector<TiffFile::Entry> entries = {{256, 4, {2}}, {257, 3, {1}}, {258, 3, {8}},
+                                          {259, 3, {1}}, {262, 3, {2}}, {273, 4, {rgb}},
+                                          {277, 3, {3}}, {279, 4, {6}}};
   if (below != 0) entries.push_back({330, 4, {below, 8}});
   return file.Finish(file.Directory(entries, next));
 }
 
 TEST(Kdc, SensorDataAreDeveloped) {
   if (!HasRawLibrary()) GTEST_SKIP() << "LibRaw is not installed";
-  const Decoded described = Describe(KdcInfo, SensorFile()), decoded = Decode(KdcRead, SensorFile());
+  const Decoded described = Describe(KdcInfo, SensorFile()),
+                decoded = Decode(KdcRead, SensorFile());
   ASSERT_EQ(described.status, Status::Ok);
   ASSERT_EQ(decoded.status, Status::Ok);
   EXPECT_TRUE(described.picture->typeName.view().starts_with("Kodak "));
@@ -163,7 +168,8 @@ TEST(Kdc, PreviewsStandInForUnknownCameras) {
     ASSERT_EQ(rgb.status, Status::Ok);
     EXPECT_EQ(PixelText(rgb.picture->image), "FF0000 00FF00");
     EXPECT_EQ(rgb.picture->note.view(), "Only the embedded preview is shown.");
-    const Decoded jpeg = Decode(KdcRead, PreviewFile(big, true)), facts = Describe(KdcInfo, PreviewFile(big, true));
+    const Decoded jpeg = Decode(KdcRead, PreviewFile(big, true)),
+                  facts = Describe(KdcInfo, PreviewFile(big, true));
     ASSERT_EQ(jpeg.status, Status::Ok);
     EXPECT_EQ(jpeg.picture->image.Width(), 40);  // the largest
     EXPECT_EQ(facts.picture->width, 40);

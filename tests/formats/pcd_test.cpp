@@ -174,7 +174,10 @@ TEST(PcdRead, TurnsUpright) {
     uint8_t turns;
     int32_t width, x, y, secondX, secondY;
   };
-  const Case cases[] = {{0, 192, 0, 0, 1, 0}, {1, 128, 0, 191, 0, 190}, {2, 192, 191, 127, 190, 127}, {3, 128, 127, 0, 127, 1}};
+  const Case cases[] = {{0, 192, 0, 0, 1, 0},
+                        {1, 128, 0, 191, 0, 190},
+                        {2, 192, 191, 127, 190, 127},
+                        {3, 128, 127, 0, 127, 1}};
   for (const Case& row : cases) {
     SCOPED_TRACE(int{row.turns});
     const Decoded decoded = Decode(PcdRead, PlainFile(1, row.turns));

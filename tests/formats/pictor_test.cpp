@@ -84,12 +84,14 @@ Bytes BareStream(const char* codes, const char* frame = "C0") {
   Bytes stream = Hex("FFD8");
   if (*codes != 0) stream = Joined({stream, Hex("FFE1 0009 50494300"), Hex(codes)});
   // the code of T.81, K.3 for 3 bits of luma is 100; 4 follows as 100, and 1010 ends the block
-  return Joined({stream, Hex("FF"), Hex(frame), Hex("000B 08 0008 0008 01 01 11 00"), Hex("FFDA 0008 01 01 00 00 3F 00"), Hex("92 BF FFD9")});
+  return Joined({stream, Hex("FF"), Hex(frame), Hex("000B 08 0008 0008 01 01 11 00"),
+                 Hex("FFDA 0008 01 01 00 00 3F 00"), Hex("92 BF FFD9")});
 }
 
 Bytes Bitmap(const Bytes& stream, uint8_t offset, const char* compression) {
   Bytes head = Hex("424D 00000000 00000000");
-  head = Joined({head, {offset, 0, 0, 0}, Hex("44000000 08000000 08000000 0100 0800"), Hex(compression)});
+  head = Joined(
+      {head, {offset, 0, 0, 0}, Hex("44000000 08000000 08000000 0100 0800"), Hex(compression)});
   head.resize(82);
   return Joined({head, stream});
 }

@@ -100,7 +100,8 @@ TEST(Txt, WritesBrightnessAsCharacters) {
   const PicturePointer picture = PatternPicture(15, 3, 24);
   for (int32_t x = 0; x < 15; ++x) {
     const int32_t gray = 255 - x * 255 / 14;
-    for (int32_t y = 0; y < 3; ++y) SetPixel(picture->image, x, y, y < 2 ? gray * 0x10101 : 0xffffff);
+    for (int32_t y = 0; y < 3; ++y)
+      SetPixel(picture->image, x, y, y < 2 ? gray * 0x10101 : 0xffffff);
   }
   EXPECT_EQ(TextOf(Encode(TxtWrite, *picture)), " .:-+|=%o#&XOB@\n               \n");
   settings.InvertTextFiles = 1;

@@ -97,7 +97,9 @@ TEST(Uue, TheFileInsideIsReadByItsRow) {
   const ScopedSettings scope;
   const PicturePointer picture = PatternPicture(5, 3, 24);
   const Bytes bitmap = Encode(BmpWrite, *picture);
-  const Bytes icon = Hex("4241 28000000 00000000 0000 0000 424D 1A000000 0000 0000 28000000 0C000000 0100 0100 0100 1800 010203 00");
+  const Bytes icon =
+      Hex("4241 28000000 00000000 0000 0000 424D 1A000000 0000 0000 28000000 0C000000 0100 0100 "
+          "0100 1800 010203 00");
   const std::string nested = Wrapped(BytesOf(Wrapped(bitmap, "a.bmp")), "a.uue");
   const struct {
     const char* name;
@@ -119,7 +121,8 @@ TEST(Uue, TheFileInsideIsReadByItsRow) {
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.name);
-    const Decoded described = Describe(UueInfo, BytesOf(row.text)), decoded = Decode(UueRead, BytesOf(row.text));
+    const Decoded described = Describe(UueInfo, BytesOf(row.text)),
+                  decoded = Decode(UueRead, BytesOf(row.text));
     if (row.status == Status::FileReadError) {
       EXPECT_NE(decoded.status, Status::Ok);
       continue;

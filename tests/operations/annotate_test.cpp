@@ -31,7 +31,8 @@ Recipe Read(const std::string& text, const Keys& keys = {}) {
 }
 
 PicturePointer Applied(PicturePointer picture, const std::string& text, const Keys& keys = {}) {
-  const EngineOptions options{.work = {}, .facts = {.fileName = "/x/Beach.jpg", .copyrightHolder = "Ada"}};
+  const EngineOptions options{.work = {},
+                              .facts = {.fileName = "/x/Beach.jpg", .copyrightHolder = "Ada"}};
   EXPECT_EQ(ApplySteps(*picture, Read(text, keys).common, options), Status::Ok) << text;
   return picture;
 }
@@ -80,12 +81,14 @@ TEST(Overlay, IsPorterAndDuffsOver) {
 
 TEST(Caption, AddsAStripThatLeavesThePictureAlone) {
   for (const bool above : {false, true}) {
-    const auto source = MakePicture(300, 40, [](int32_t x, int32_t y) { return Scatter(x, y) & 0xffffff; });
+    const auto source =
+        MakePicture(300, 40, [](int32_t x, int32_t y) { return Scatter(x, y) & 0xffffff; });
     const auto before = Colors(*source);
-    const auto picture = Applied(
-        MakePicture(300, 40, [](int32_t x, int32_t y) { return Scatter(x, y) & 0xffffff; }),
-        std::string("caption Hello size=20px font='DejaVu Sans' padding=6 background=#ffffff color=#000000 position=") +
-            (above ? "above" : "below"));
+    const auto picture =
+        Applied(MakePicture(300, 40, [](int32_t x, int32_t y) { return Scatter(x, y) & 0xffffff; }),
+                std::string("caption Hello size=20px font='DejaVu Sans' padding=6 "
+                            "background=#ffffff color=#000000 position=") +
+                    (above ? "above" : "below"));
     ASSERT_EQ(picture->width, 300);
     const int32_t strip = picture->height - 40;
     EXPECT_EQ(strip, 24 + 12) << "a line of this font is 1.16 em high";
@@ -122,8 +125,10 @@ TEST(Caption, StandsWhereItIsAligned) {
   const char* kAligns[] = {"left", "center", "right"};
   const double expected[] = {10, 150, 290};  // left edge, middle, right edge of the letters
   for (size_t i = 0; i < 3; ++i) {
-    const auto picture = Applied(Plain(300, 1, 0xffffff),
-                                 std::string("caption HHH size=20px padding=10 color=black background=white align=") + kAligns[i]);
+    const auto picture = Applied(
+        Plain(300, 1, 0xffffff),
+        std::string("caption HHH size=20px padding=10 color=black background=white align=") +
+            kAligns[i]);
     const Rectangle ink = Changed(*picture, 0xffffff);
     EXPECT_NEAR(ink.x + ink.width * static_cast<double>(i) / 2, expected[i], 3) << kAligns[i];
   }
@@ -133,10 +138,13 @@ TEST(DrawnText, StandsWhereGravitySays) {
   const struct {
     const char* gravity;
     double x, y;  // share of the room at the left and above
-  } rows[] = {{"center", 0.5, 0.5}, {"top", 0.5, 0},      {"bottom", 0.5, 1},      {"left", 0, 0.5},        {"right", 1, 0.5},
-              {"top-left", 0, 0},   {"top-right", 1, 0},  {"bottom-left", 0, 1},   {"bottom-right", 1, 1}};
+  } rows[] = {{"center", 0.5, 0.5}, {"top", 0.5, 0},       {"bottom", 0.5, 1},
+              {"left", 0, 0.5},     {"right", 1, 0.5},     {"top-left", 0, 0},
+              {"top-right", 1, 0},  {"bottom-left", 0, 1}, {"bottom-right", 1, 1}};
   for (const auto& row : rows) {
-    const auto picture = Applied(Plain(200, 100), std::string("text H ") + row.gravity + " size=20px margin=10 box padding=0 background=white");
+    const auto picture =
+        Applied(Plain(200, 100), std::string("text H ") + row.gravity +
+                                     " size=20px margin=10 box padding=0 background=white");
     const Rectangle ink = Changed(*picture);
     EXPECT_EQ(ink.x, std::floor(10 + row.x * (200 - 20 - ink.width))) << row.gravity;
     EXPECT_EQ(ink.y, std::floor(10 + row.y * (100 - 20 - ink.height))) << row.gravity;
@@ -145,7 +153,8 @@ TEST(DrawnText, StandsWhereGravitySays) {
 
 TEST(DrawnText, HasOutlineShadowBoxAndOpacity) {
   const auto area = [](const std::string& more) {
-    const Rectangle ink = Changed(*Applied(Plain(200, 100), "text HO size=40px font='DejaVu Sans' color=#ffffff " + more));
+    const Rectangle ink = Changed(
+        *Applied(Plain(200, 100), "text HO size=40px font='DejaVu Sans' color=#ffffff " + more));
     return Size{ink.width, ink.height};
   };
   const Size plain = area("");
@@ -156,7 +165,8 @@ TEST(DrawnText, HasOutlineShadowBoxAndOpacity) {
   EXPECT_EQ(area("opacity=0").width, 0);
   EXPECT_NEAR(area("rotation=90").height, plain.width, 2);
   // Half opaque: halfway between sea and white where letters cover whole pixels.
-  const auto half = Applied(Plain(100, 60), "text HHH size=30px color=#ffffff opacity=50 font='DejaVu Sans Bold'");
+  const auto half = Applied(Plain(100, 60),
+                            "text HHH size=30px color=#ffffff opacity=50 font='DejaVu Sans Bold'");
   const auto colors = Colors(*half);
   const auto brightest = *std::ranges::max_element(colors);
   EXPECT_EQ(brightest, 0x90a0b0u);
@@ -187,19 +197,23 @@ class Watermarks : public testing::Test {
 
 TEST_F(Watermarks, OfPicturesFitAndStand) {
   const std::string line = "watermark picture='" + name_ + "' opacity=100 ";
-  const auto ink = [&](const std::string& more) { return Changed(*Applied(Plain(100, 60), line + more)); };
+  const auto ink = [&](const std::string& more) {
+    return Changed(*Applied(Plain(100, 60), line + more));
+  };
   EXPECT_EQ(ink("size=20 margin=0 gravity=top-left"), (Rectangle{0, 0, 10, 10}));
   EXPECT_EQ(ink("size=20 margin=5 gravity=bottom-right"), (Rectangle{75, 45, 10, 10}));
   const Rectangle turned = ink("size=20 margin=0 gravity=top-left rotation=90");
   EXPECT_EQ(turned.width, 6);
   EXPECT_NEAR(turned.height, 6, 1) << "12 high, 6 wide: its upper half";
   EXPECT_EQ(Changed(*Applied(Plain(100, 60), "watermark opacity=0 picture='" + name_ + "'")).width, 0);
-  const auto half = Applied(Plain(100, 60), "watermark picture='" + name_ + "' size=20 margin=0 gravity=top-left opacity=50");
+  const auto half = Applied(Plain(100, 60), "watermark picture='" + name_ +
+                                                "' size=20 margin=0 gravity=top-left opacity=50");
   EXPECT_EQ(ColorAt(*half, 5, 5), 0x902030u);
 }
 
 TEST_F(Watermarks, RepeatAsTiles) {
-  const auto picture = Applied(Plain(100, 60), "watermark picture='" + name_ + "' size=20 margin=5 opacity=100 tiled");
+  const auto picture = Applied(
+      Plain(100, 60), "watermark picture='" + name_ + "' size=20 margin=5 opacity=100 tiled");
   int32_t red = 0;
   for (int32_t y = 0; y < 60; ++y) {
     for (int32_t x = 0; x < 100; ++x) {
@@ -214,11 +228,13 @@ TEST_F(Watermarks, RepeatAsTiles) {
 }
 
 TEST_F(Watermarks, TextAndPictureAndTheirKeys) {
-  const Keys both{{"WatermarkText", "%N"}, {"WatermarkFontName", "DejaVu Sans"}, {"WatermarkImagePath", name_}};
+  const Keys both{
+      {"WatermarkText", "%N"}, {"WatermarkFontName", "DejaVu Sans"}, {"WatermarkImagePath", name_}};
   const auto picture = Applied(Plain(100, 60), "watermark opacity=100 size=20", both);
   EXPECT_EQ(ColorAt(*picture, 45, 30), 0xff0000u) << "a configured picture comes before the configured text";
   const auto text = Applied(Plain(100, 60), "watermark Ada opacity=100 size=50", both);
-  const auto spelled = Applied(Plain(100, 60), "watermark '%N' opacity=100 size=50 font='DejaVu Sans' picture=");
+  const auto spelled =
+      Applied(Plain(100, 60), "watermark '%N' opacity=100 size=50 font='DejaVu Sans' picture=");
   EXPECT_EQ(Colors(*text), Colors(*spelled)) << "a text that is written down comes first";
   const Rectangle ink = Changed(*text);
   EXPECT_NEAR(ink.width, 50, 4);
@@ -228,8 +244,10 @@ TEST_F(Watermarks, TextAndPictureAndTheirKeys) {
 }
 
 TEST(Matts, HaveTheirParts) {
-  const auto picture = Applied(Plain(40, 30), "matt 20 fill=#808080 bevel=sunken bevel-size=5 intensity=50 inner-border inner-size=2 "
-                                              "inner-color=#ff0000 outer-border outer-size=3 outer-color=#0000ff");
+  const auto picture = Applied(
+      Plain(40, 30),
+      "matt 20 fill=#808080 bevel=sunken bevel-size=5 intensity=50 inner-border inner-size=2 "
+      "inner-color=#ff0000 outer-border outer-size=3 outer-color=#0000ff");
   ASSERT_EQ(picture->width, 40 + 2 * (2 + 20 + 3));
   ASSERT_EQ(picture->height, 30 + 2 * (2 + 20 + 3));
   const struct {
@@ -242,7 +260,8 @@ TEST(Matts, HaveTheirParts) {
       {18, 18, 0x404040}, {71, 61, 0xc0c0c0},  // corners of the bevel
       {19, 59, 0x404040}, {19, 60, 0xc0c0c0},  // the miter at the bottom left
   };
-  for (const auto& row : rows) EXPECT_EQ(ColorAt(*picture, row.x, row.y), row.color) << row.x << "," << row.y;
+  for (const auto& row : rows)
+    EXPECT_EQ(ColorAt(*picture, row.x, row.y), row.color) << row.x << "," << row.y;
   const auto raised = Applied(Plain(40, 30), "matt 20 fill=#808080 bevel=raised bevel-size=5");
   EXPECT_EQ(ColorAt(*raised, 16, 30), 0xc0c0c0u);
 }
@@ -250,9 +269,14 @@ TEST(Matts, HaveTheirParts) {
 TEST(Matts, TakeTheirDefaultsFromTheConfiguration) {
   const TemporaryFolder folder;
   const std::string name = folder.Path("texture.png");
-  const auto tile = MakePicture(2, 1, [](int32_t x, int32_t) { return x == 0 ? 0x111111u : 0xeeeeeeu; });
+  const auto tile =
+      MakePicture(2, 1, [](int32_t x, int32_t) { return x == 0 ? 0x111111u : 0xeeeeeeu; });
   ASSERT_EQ(WritePictureAs(*tile, name, FindFormatByName("x.png"), {}), Status::Ok);
-  Keys keys{{"MattSize", "2"}, {"MattUnits", "1"}, {"MattFillColor", "255"}, {"MattBevelType", "2"}, {"TextureImagePath", name}};
+  Keys keys{{"MattSize", "2"},
+            {"MattUnits", "1"},
+            {"MattFillColor", "255"},
+            {"MattBevelType", "2"},
+            {"TextureImagePath", name}};
   EXPECT_EQ(Applied(Plain(10, 10), "matt", keys)->width, 10 + 2 * 76) << "2 cm at 96 an inch";
   EXPECT_EQ(Applied(Plain(10, 10), "matt 5px", keys)->width, 20);
   keys["MattUnits"] = "2";
@@ -283,7 +307,8 @@ TEST(Borders, KeepPalettes) {
 }
 
 TEST(Shadows, LieBehind) {
-  const auto sharp = Applied(Plain(20, 20), "shadow 6 4 blur=0 opacity=50 color=black background=white");
+  const auto sharp =
+      Applied(Plain(20, 20), "shadow 6 4 blur=0 opacity=50 color=black background=white");
   EXPECT_EQ(sharp->width, 26);
   EXPECT_EQ(sharp->height, 24);
   EXPECT_EQ(ColorAt(*sharp, 0, 0), kSea);

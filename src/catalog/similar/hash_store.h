@@ -41,20 +41,21 @@ struct HashRecord {
 //      120       absolute path
 //
 // The last record of a path counts. Reading ends at the first record that is cut short or whose sum
-// is wrong: that of a program that was stopped while it wrote. Several programs may write at a time.
+// is wrong: that of a program that was stopped while it wrote. Several programs may write at a
+// time.
 inline constexpr std::string_view kHashStoreName = "Fotomill.hashes";
 
 // One store. Belongs to one thread.
 class HashStore {
  public:
-  // Reads the store. One that is missing is empty; one that cannot be read, or is something else, is
-  // empty as well and will not be written.
+  // Reads the store. One that is missing is empty; one that cannot be read, or is something else,
+  // is empty as well and will not be written.
   explicit HashStore(std::string path);
 
   // What is known of a file of that size and time; null if nothing is.
   const HashRecord* Find(const std::string& path, uint64_t size, int64_t modified) const;
-  // Takes in what was found out; Save writes it. A file that was changed within the last two seconds
-  // is not kept, as it may change again without a new time.
+  // Takes in what was found out; Save writes it. A file that was changed within the last two
+  // seconds is not kept, as it may change again without a new time.
   void Put(const std::string& path, const HashRecord& record);
   // Appends what was taken in since the last time. False when it could not be written; it stays to
   // be written then.

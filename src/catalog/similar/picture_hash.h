@@ -13,8 +13,9 @@ namespace fotomill {
 // them, whatever their size, format, compression and brightness.
 //
 // The picture is scaled to 32 x 32 pixels and turned to luma. A bit tells whether one of the 8 x 8
-// lowest frequencies of its discrete cosine transform is above the median of all. Source: C. Zauner,
-// "Implementation and Benchmarking of Perceptual Image Hash Functions" (2010), section 3.2.1.
+// lowest frequencies of its discrete cosine transform is above the median of all. Source: C.
+// Zauner, "Implementation and Benchmarking of Perceptual Image Hash Functions" (2010),
+// section 3.2.1.
 using PictureHash = uint64_t;
 
 // The hashes of a picture as it is, mirrored across, mirrored down, turned by 180 degrees, and the

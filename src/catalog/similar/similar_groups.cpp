@@ -22,7 +22,9 @@ uint32_t PartOf(PictureHash hash, size_t part) {
 // Sets that are joined one by one (Tarjan 1975); the least member stands for each.
 class Sets {
  public:
-  explicit Sets(size_t count) : above_(count) { std::iota(above_.begin(), above_.end(), size_t{0}); }
+  explicit Sets(size_t count) : above_(count) {
+    std::iota(above_.begin(), above_.end(), size_t{0});
+  }
   size_t Of(size_t i) {
     while (above_[i] != i) i = above_[i] = above_[above_[i]];
     return i;

@@ -97,7 +97,8 @@ class Search {
                           if (status != Status::Ok) candidate.status = status;
                           Take(candidate);
                           if (++sinceSaved % kSavedEvery == 0) Keep();
-                          output_.ShowProgress(++done_, candidates_.size() * (options_.exact ? 2 : 1));
+                          output_.ShowProgress(++done_,
+                                               candidates_.size() * (options_.exact ? 2 : 1));
                         },
                     .goesOn = [this] { return output_.GoesOn(); },
                     .tick = [this] { output_.Tick(); }});
@@ -218,7 +219,8 @@ class Search {
       file["bytes"] = record.size;
       files.push_back(std::move(file));
     }
-    if (output_.IsJson()) output_.Element({{"distance", group.distance}, {"files", std::move(files)}});
+    if (output_.IsJson())
+      output_.Element({{"distance", group.distance}, {"files", std::move(files)}});
   }
 
   const SimilarOptions& options_;
@@ -235,7 +237,8 @@ class Search {
 int RunSimilar(SimilarOptions options, const CommandContext& context) {
   const auto selection = SelectFiles(options.selection, context);
   if (!selection) return kExitUsage;
-  if (options.distance < 0) options.distance = std::clamp(settings.FindSimlarDistance, 0, kMostDistance);
+  if (options.distance < 0)
+    options.distance = std::clamp(settings.FindSimlarDistance, 0, kMostDistance);
   options.transforms = options.transforms || settings.FindSimilarTransforms != 0;
   return Search(options, context).Run(*selection);
 }
@@ -248,7 +251,8 @@ void SetUpSimilar(CLI::App& app, CommandContext& context) {
   AddSelection(app, options->selection, context);
   AddNumber(app, "--distance", options->distance, "N", 0, kMostDistance,
             "In how many of 64 bits pictures may differ (default: the key FindSimlarDistance)");
-  AddFlag(app, "--transforms", options->transforms, "Also find pictures that are turned or mirrored");
+  AddFlag(app, "--transforms", options->transforms,
+          "Also find pictures that are turned or mirrored");
   AddFlag(app, "--exact", options->exact, "Find pictures that are equal pixel by pixel");
   AddFlag(app, "--json", options->json,
           "Print a JSON array of {distance, files: [{file, width, height, bytes}]}");

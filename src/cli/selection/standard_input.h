@@ -15,8 +15,8 @@ namespace fotomill::cli {
 // The name that stands for standard input, and for standard output as an output.
 inline constexpr const char* kStream = "-";
 
-// Reads what standard input has, at most the size of the buffer; waits if there is nothing yet. 0 at
-// its end; nullopt if it cannot be read, or the program was asked to end.
+// Reads what standard input has, at most the size of the buffer; waits if there is nothing yet. 0
+// at its end; nullopt if it cannot be read, or the program was asked to end.
 std::optional<size_t> ReadInput(const Io& io, std::span<uint8_t> buffer);
 
 // A picture that comes through standard input: a temporary file that goes with this object.

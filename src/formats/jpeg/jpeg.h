@@ -24,9 +24,9 @@ struct JpegStream {
   std::span<const uint8_t> data = {};
   std::span<const uint8_t> tables = {};  // as ReadJpegHeader takes them
 };
-// As JpegInfo, JpegRead and JpegDetails. The first leaves the file's size alone; the last adds lines
-// to those that are there. `file` is where the stream comes from, still open. Statuses as above but
-// for FileOpenError.
+// As JpegInfo, JpegRead and JpegDetails. The first leaves the file's size alone; the last adds
+// lines to those that are there. `file` is where the stream comes from, still open. Statuses as
+// above but for FileOpenError.
 Status JpegStreamInfo(PictureRecord& picture, const JpegStream& stream);
 Status JpegStreamRead(PictureRecord& picture, const ReadRequest& request, const JpegStream& stream,
                       const platform::FileView& file);

@@ -156,10 +156,10 @@ Status DrawText(PictureRecord& picture, const Arguments& arguments,
   const auto bounded = [](int64_t value) {
     return static_cast<int32_t>(std::clamp<int64_t>(value, -2000000000, 2000000000));
   };
-  const Rectangle seen =
-      Clipped({bounded(int64_t{place.x} - reach), bounded(int64_t{place.y} - reach),
-               bounded(int64_t{place.width} + 2 * reach), bounded(int64_t{place.height} + 2 * reach)},
-              whole.width, whole.height);
+  const Rectangle seen = Clipped(
+      {bounded(int64_t{place.x} - reach), bounded(int64_t{place.y} - reach),
+       bounded(int64_t{place.width} + 2 * reach), bounded(int64_t{place.height} + 2 * reach)},
+      whole.width, whole.height);
   if (seen.width == 0) return Status::Ok;
   PictureRecord layer;
   RETURN_IF_BAD(NewLayer({seen.width, seen.height}, layer));

@@ -22,10 +22,20 @@ constexpr char kGravitiesAndFaces[] =
 constexpr int32_t kToFaces = 9;
 
 constexpr Parameter kCrop[] = {
-    {.name = "area", .kind = kRectangle, .unit = "px", .least = -1e9, .most = 1e9, .label = "Area",
+    {.name = "area",
+     .kind = kRectangle,
+     .unit = "px",
+     .least = -1e9,
+     .most = 1e9,
+     .label = "Area",
      .help = "WxH+X+Y from the top left; WxH or a ratio such as 3:2 is placed by gravity."},
-    {.name = "gravity", .kind = kChoice, .preset = "center", .choices = kGravitiesAndFaces, .label = "Place",
-     .help = "Which part to keep of an area without a place; faces: the part around the faces, the center where there are none."},
+    {.name = "gravity",
+     .kind = kChoice,
+     .preset = "center",
+     .choices = kGravitiesAndFaces,
+     .label = "Place",
+     .help = "Which part to keep of an area without a place; faces: the part around the faces, the "
+             "center where there are none."},
 };
 
 // Moves an area so that the middle of the faces comes as close to its middle as the picture allows.
@@ -35,8 +45,10 @@ Status MoveToFaces(const PictureRecord& picture, const OperationContext& context
   if (faces.empty()) return Status::Ok;
   const int32_t width = picture.image.Width(), height = picture.image.Height();
   const Rectangle around = AroundFaces(faces, width, height);
-  area.x = std::clamp(around.x + (around.width - area.width) / 2, 0, std::max(0, width - area.width));
-  area.y = std::clamp(around.y + (around.height - area.height) / 2, 0, std::max(0, height - area.height));
+  area.x =
+      std::clamp(around.x + (around.width - area.width) / 2, 0, std::max(0, width - area.width));
+  area.y = std::clamp(around.y + (around.height - area.height) / 2, 0,
+                      std::max(0, height - area.height));
   return Status::Ok;
 }
 

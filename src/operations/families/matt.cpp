@@ -177,8 +177,10 @@ Status PaintBevel(PictureRecord& picture, const Rectangle& window, int32_t width
 
 Status Matt(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
   const int32_t size = MattSize(picture, arguments);
-  const int32_t inner = arguments.Flag("inner-border") ? Pixels(picture, arguments, "inner-size") : 0;
-  const int32_t outer = arguments.Flag("outer-border") ? Pixels(picture, arguments, "outer-size") : 0;
+  const int32_t inner =
+      arguments.Flag("inner-border") ? Pixels(picture, arguments, "inner-size") : 0;
+  const int32_t outer =
+      arguments.Flag("outer-border") ? Pixels(picture, arguments, "outer-size") : 0;
   const bool flat = arguments.Choice<Bevel>("bevel") == Bevel::None ||
                     arguments.Number("intensity") == 0;
   const int32_t bevel = flat ? 0 : std::min(Pixels(picture, arguments, "bevel-size"), size);
@@ -197,7 +199,8 @@ Status Border(PictureRecord& picture, const Arguments& arguments, const Operatio
 }
 
 // What a shadow has of its picture: its alpha, or a rectangle; on a plane of `size` at (x, y).
-Status ShadowMask(const PictureRecord& picture, Size size, int32_t x, int32_t y, PackedImage& mask) {
+Status ShadowMask(const PictureRecord& picture, Size size, int32_t x, int32_t y,
+                  PackedImage& mask) {
   RETURN_IF_BAD(NewAlphaPlane(size.width, size.height, mask));
   for (int32_t row = 0; row < picture.image.Height(); ++row) {
     const auto target = mask.Row(y + row).subspan(static_cast<size_t>(x),

@@ -114,9 +114,10 @@ Status PictureLayer(const PictureRecord& picture, const Arguments& arguments,
   };
   const Size size{edge(all.width), edge(all.height)};
   RETURN_IF_BAD(CheckPackedSize(size.width, size.height, 24));
-  RETURN_IF_BAD(ScaleFiltered(mark->image, mark->alpha,
-                              Reach{static_cast<double>(all.width), static_cast<double>(all.height)},
-                              size, ScaleOptions{.work = context.work}, layer.image, layer.alpha));
+  RETURN_IF_BAD(
+      ScaleFiltered(mark->image, mark->alpha,
+                    Reach{static_cast<double>(all.width), static_cast<double>(all.height)}, size,
+                    ScaleOptions{.work = context.work}, layer.image, layer.alpha));
   layer.width = size.width;
   layer.height = size.height;
   layer.bitsPerPixel = 24;
@@ -148,7 +149,8 @@ Status Watermark(PictureRecord& picture, const Arguments& arguments,
   const auto start = [](int64_t place, int64_t length, int64_t step) {
     return place - (place + length + step - 1) / step * step;
   };
-  for (int64_t y = start(first.y, layer.image.Height(), down); y < whole.height + reach; y += down) {
+  for (int64_t y = start(first.y, layer.image.Height(), down); y < whole.height + reach;
+       y += down) {
     for (int64_t x = start(first.x, layer.image.Width(), across); x < whole.width + reach;
          x += across) {
       if (!context.work.GoesOn()) return Status::FunctionCancelled;

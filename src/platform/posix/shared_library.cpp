@@ -106,8 +106,8 @@ bool SharedLibrary::LoadSystem(const std::string& name) {
   if (name.empty() || name.find('/') != std::string::npos) {
     error_ = "not a bare name";
   } else {
-    // It stays until the program ends: what such a library keeps for itself is not lost, and nothing of
-    // it is called after it went.
+    // It stays until the program ends: what such a library keeps for itself is not lost, and
+    // nothing of it is called after it went.
     handle_ = Open(name.c_str(), error_, RTLD_NODELETE);
   }
   return Loaded();

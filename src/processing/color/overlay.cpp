@@ -68,7 +68,8 @@ void PaintMask(PackedImage& image, PackedImage* alpha, const PackedImage& mask, 
 Status PaintThroughMask(PictureRecord& picture, const PackedImage& mask, int32_t left, int32_t top,
                         const Backdrop& color) {
   RETURN_IF_BAD(PromotePicture(picture));
-  PaintMask(picture.image, picture.alpha.Empty() ? nullptr : &picture.alpha, mask, left, top, color);
+  PaintMask(picture.image, picture.alpha.Empty() ? nullptr : &picture.alpha, mask, left, top,
+            color);
   return Status::Ok;
 }
 

@@ -25,8 +25,8 @@ void PaintThroughMask(PackedImage& image, const PackedImage& mask, int32_t left,
 // Paints a rectangle of one color; statuses as PaintThroughMask.
 Status PaintRectangle(PictureRecord& picture, const Rectangle& area, const Backdrop& color);
 
-// Lays a picture of 24 bits over another one, with its alpha plane where it has one, at (left, top).
-// Its own opacity is that of 255. Statuses as PaintThroughMask.
+// Lays a picture of 24 bits over another one, with its alpha plane where it has one, at (left,
+// top). Its own opacity is that of 255. Statuses as PaintThroughMask.
 Status PaintPicture(PictureRecord& picture, const PictureRecord& above, int32_t left, int32_t top,
                     uint8_t opacity);
 

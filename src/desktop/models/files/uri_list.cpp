@@ -14,7 +14,8 @@ bool IsPlain(char c) {
          std::string_view("-._~/").find(c) != std::string_view::npos;
 }
 
-// A text with its escapes read; empty if one is broken or stands for a zero byte, which no path has.
+// A text with its escapes read; empty if one is broken or stands for a zero byte, which no path
+// has.
 std::string Unescaped(std::string_view text) {
   std::string result;
   for (size_t i = 0; i < text.size(); ++i) {

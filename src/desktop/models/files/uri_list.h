@@ -12,7 +12,8 @@ namespace fotomill::desktop {
 std::string UriOf(std::string_view path);  // of an absolute path
 // As the type text/uri-list has it: each line ends with CR LF.
 std::string UriList(std::span<const std::string> paths);
-// The absolute paths of a list. Comments, files of other hosts and URIs of other kinds are left out.
+// The absolute paths of a list. Comments, files of other hosts and URIs of other kinds are left
+// out.
 std::vector<std::string> PathsOfUriList(std::string_view list);
 
 }  // namespace fotomill::desktop
