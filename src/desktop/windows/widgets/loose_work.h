@@ -3,7 +3,7 @@
 #include <wx/app.h>
 
 #include <functional>
-#include <optional>
+#include <memory>
 
 #include "core/workers/background_task.h"
 #include "core/workers/guarded.h"
@@ -28,7 +28,7 @@ class LooseWork {
       std::function<void(const StopToken& stop, const Report& report)> work,
       std::function<void()> failed = [] {}) {
     Stop();
-    source_.emplace();
+    source_ = std::make_unique<StopSource>();
     const auto report = [stop = source_->Token()](std::function<void()> action) {
       if (stop.Asked()) return;
       wxTheApp->CallAfter([stop, action = std::move(action)] {
@@ -46,10 +46,10 @@ class LooseWork {
     source_.reset();
   }
   // Whether work was started that nobody stopped; who is told of its end stops it then.
-  bool Started() const { return source_.has_value(); }
+  bool Started() const { return source_ != nullptr; }
 
  private:
-  std::optional<StopSource> source_;
+  std::unique_ptr<StopSource> source_;
 };
 
 }  // namespace fotomill::desktop
