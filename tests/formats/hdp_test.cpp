@@ -64,16 +64,14 @@ TEST(Hdp, DamagedDataNeverEndTheProgram) {
   const auto next = [&state](size_t below) {
     return (state = state * 1664525 + 1013904223) / 65536 % below;
   };
-  int failures = 0;
+  // How much of it a version of the library refuses differs; that nothing else happens does not.
   for (int turn = 0; turn < 200; ++turn) {
     std::vector<uint8_t> file = good;
     for (int i = 0; i < 2; ++i)
       file[300 + next(file.size() - 300)] = static_cast<uint8_t>(next(256));
     const Decoded decoded = Decode(HdpRead, file);
     EXPECT_EQ(decoded.picture->image.Empty(), decoded.status != Status::Ok) << turn;
-    failures += decoded.status != Status::Ok;
   }
-  EXPECT_GT(failures, 0);
 }
 
 // Stops the work as soon as rows come back.
