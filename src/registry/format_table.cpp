@@ -4,6 +4,7 @@
 #include <iterator>
 
 #include "formats/rows.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -143,7 +144,6 @@ std::vector<std::span<const FormatEntry>> FormatFamilies() {
   return {
 #define FAMILY(name) name##Rows(),
 #include "formats/families.def"
-#include "texts/texts.h"
 #undef FAMILY
   };
 }
@@ -155,7 +155,10 @@ FormatTable MakeFormatTable() {
   for (const std::span<const FormatEntry> family : FormatFamilies()) {
     for (const FormatEntry& row : family) {
       const auto place = std::ranges::find(kPlaces, row.extension.view(), &Place::extension);
-      if (place != std::end(kPlaces)) table[static_cast<size_t>(place - kPlaces)] = row;
+      if (place == std::end(kPlaces)) continue;
+      FormatEntry& entry = table[static_cast<size_t>(place - kPlaces)];
+      entry = row;
+      if (entry.write == nullptr) entry.write = NoWrite;  // of formats that are only read
     }
   }
   return table;

@@ -16,13 +16,9 @@ constexpr Signature kSignatures[] = {{0, "II\x2a\0"sv}, {0, "MM\0\x2a"sv}};
 constexpr FormatLibrary kLibraries[] = {
     {"LibRaw", RawLibraryVersion, TrLater("raw files of cameras, loaded when needed")}};
 
-// Raw files hold what no program but the camera writes.
-Status KdcWrite(PictureRecord&, const WriteOptions&) { return Status::UnsupportedFunction; }
-
 constexpr FormatEntry kRows[] = {{
     .info = KdcInfo,
     .read = KdcRead,
-    .write = KdcWrite,
     .maxBits = 24,
     .extension = "KDC"sv,
     .description = "(KDC) Kodak Digital Camera"sv,

@@ -10,13 +10,10 @@ using namespace std::string_view_literals;
 
 constexpr Signature kSignatures[] = {{0, "\x07\x20MM"sv, "Casio CAM"}};
 
-Status CannotWrite(PictureRecord&, const WriteOptions&) { return Status::UnsupportedFunction; }
-
 constexpr FormatEntry kRows[] = {{
     .details = CamDetails,
     .info = CamInfo,
     .read = CamRead,
-    .write = CannotWrite,
     .maxBits = 24,
     .extension = "CAM"sv,
     .description = "(CAM) Casio Digital Camera"sv,

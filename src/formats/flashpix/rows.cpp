@@ -12,13 +12,10 @@ using namespace std::string_view_literals;
 constexpr Signature kSignatures[] = {
     {0, "\xd0\xcf\x11\xe0\xa1\xb1\x1a\xe1"sv, TrLater("a compound file")}};
 
-Status CannotWrite(PictureRecord&, const WriteOptions&) { return Status::UnsupportedFunction; }
-
 constexpr FormatEntry kRows[] = {{
     .details = FpxDetails,
     .info = FpxInfo,
     .read = FpxRead,
-    .write = CannotWrite,
     .maxBits = 24,
     .extension = "FPX"sv,
     .description = "(FPX) FlashPix"sv,

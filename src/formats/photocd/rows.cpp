@@ -14,13 +14,10 @@ constexpr Signature kSignatures[] = {{0, "PCD_OPA"sv, TrLater("a Photo CD overvi
 constexpr FormatSetting kKeys[] = {{"PhotoCDResolution", TrLater("Largest size read")}};
 constexpr FormatSettings kSettings = {"PCD", "OverridePcdBox", TrLater("Photo CD"), kKeys};
 
-Status CannotWrite(PictureRecord&, const WriteOptions&) { return Status::UnsupportedFunction; }
-
 constexpr FormatEntry kRows[] = {{
     .details = PcdDetails,
     .info = PcdInfo,
     .read = PcdRead,
-    .write = CannotWrite,
     .maxBits = 24,
     .extension = "PCD"sv,
     .description = "(PCD) Kodak Photo-CD"sv,

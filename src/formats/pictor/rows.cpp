@@ -19,8 +19,6 @@ constexpr Signature kLesserSignatures[] = {{0, "BM"sv, {}, 26, "\1\0\x18\0JP"sv}
                                            {0, "BM"sv, {}, 26, "\1\0\x08\0JP"sv},
                                            {0, "\xff\xd8\xff"sv}};
 
-Status CannotWrite(PictureRecord&, const WriteOptions&) { return Status::UnsupportedFunction; }
-
 constexpr FormatEntry kRows[] = {
     {
         .details = PicDetails,
@@ -41,7 +39,6 @@ constexpr FormatEntry kRows[] = {
         .details = PicDetails,
         .info = PicInfo,
         .read = PicRead,
-        .write = CannotWrite,
         .maxBits = 24,
         .extension = "KQP"sv,
         .description = "(KQP) Konica Quality Photos"sv,
