@@ -120,7 +120,7 @@ struct FileOutcome {
   // Ok: where its output is, or would be in a dry run. Skipped: the file that is in the way
   std::string destination = {};
   Status status = Status::Ok;
-  // a sentence that goes behind the message; empty when there is nothing to add
+  // a sentence that follows the message; may be empty
   std::string hint = {};
   bool skipped = false;   // left out by choice or for want of a name; not a failure
   bool replaced = false;  // the output took the place of a file

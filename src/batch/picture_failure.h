@@ -17,13 +17,13 @@ std::string_view LooksLike(const std::string& fileName, int32_t formatIndex);
 // others.
 std::string MisnamedRemark(const PictureRecord& picture);
 
-// What goes behind the message of a file that could not be opened or decoded: what it looks like,
+// What follows the message of a file that could not be opened or decoded: what it looks like,
 // what the build lacks, or which format its name should have selected. Empty when there is nothing
 // to add.
 std::string OpenHint(const std::string& fileName, Status status);
 
-// What goes behind the message of a picture that operations failed on: what this system lacks.
-// Empty when there is nothing to add.
+// What follows the message of a picture that operations failed on: what this system lacks. May be
+// empty.
 std::string WorkHint(Status status);
 
 // What size pictures of the row can have, if this one does not fit; empty if it does.

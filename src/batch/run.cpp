@@ -374,7 +374,7 @@ class Batch {
   DestinationAnswer Settle(size_t i, Destination& destination, const PreparedOutput& output,
                            bool& cancelled) {
     DestinationAnswer answer = DestinationAnswer::Skip;
-    // nobody has planned for numbered names
+    // names of numbered pages are not planned ahead
     const bool planned = output.target.page == 0;
     if (planned && SettleAtOnce(files_[i].name, destination, answer)) return answer;
     const bool done = run_.InTurn(
@@ -388,8 +388,8 @@ class Batch {
     return function_.out.empty() && names_.ConcernsNobodyElse(source, planned);
   }
 
-  // Settles a name without waiting for the files before, where they cannot matter and nobody has to
-  // be asked. False when it cannot be done; the destination is then unchanged.
+  // Settles a name without waiting for earlier files, where they do not matter and there is no
+  // question to ask. False when that is not possible; the destination is then unchanged.
   bool SettleAtOnce(const std::string& source, Destination& destination,
                     DestinationAnswer& answer) {
     const std::lock_guard lock(mutex_);

@@ -20,7 +20,7 @@ struct HashRecord {
   int32_t width = 0, height = 0;
   bool hasHashes = false;
   PictureHashes hashes{};
-  std::string digest = {};  // of the pixels, 32 characters; empty when nobody asked for it
+  std::string digest = {};  // of the pixels, 32 characters; empty unless asked for
 };
 
 // The store of picture hashes in the data folder: a file that is only ever appended to, and made
