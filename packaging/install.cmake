@@ -7,7 +7,7 @@ install(TARGETS fotomill DESTINATION ${CMAKE_INSTALL_BINDIR} COMPONENT cli)
 if(MSGFMT)
   install(DIRECTORY ${CMAKE_BINARY_DIR}/locale DESTINATION ${CMAKE_INSTALL_DATADIR} COMPONENT cli)
 endif()
-install(DIRECTORY ${PROJECT_SOURCE_DIR}/docs/ DESTINATION ${CMAKE_INSTALL_DATADIR}/doc/fotomill COMPONENT cli
+install(DIRECTORY ${PROJECT_SOURCE_DIR}/docs/user/ DESTINATION ${CMAKE_INSTALL_DATADIR}/doc/fotomill COMPONENT cli
         FILES_MATCHING PATTERN "*.md" PATTERN "*.png")
 
 # Completions and man pages are printed by the program, so they know every command and option that it knows.

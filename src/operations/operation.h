@@ -19,7 +19,7 @@
 // numbers and know nothing of this table. The rows are in this room, one file a family
 // (families/*.cpp), because a family may need more than pixels: fonts, another picture, EXIF. Each
 // file ends with one function that hands out its rows; operations.cpp joins them.
-// docs/processing.md shows how to add an operation.
+// docs/dev/processing.md shows how to add an operation.
 namespace fotomill {
 
 // Families in the order of lists. A run's output prefix is that of its first operation's family.

@@ -3,8 +3,8 @@
  *
  * A plug-in is a shared library named FMWPL*.so (FMWPL*.DLL on Windows) in the folder "plugin"
  * beside the program. It serves one or more picture formats, one per file extension. This header is
- * all it needs; it is plain C and includes nothing of the program. docs/plugins.md walks through a
- * complete example.
+ * all it needs; it is plain C and includes nothing of the program. docs/user/plugins.md walks
+ * through a complete example.
  *
  * The program looks up eight functions by name. Three are required: PLUGIN11GetPluginParams,
  * PLUGIN11GetInfo and PLUGIN11ReadImage. The others may be absent.

@@ -7,8 +7,8 @@
 
 namespace fotomill {
 
-// What keys do, from docs/settings.md, in English. That page has an entry for every key that this
-// build reads and for no other.
+// What keys do, from docs/user/settings.md, in English. That page has an entry for every key that
+// this build reads and for no other.
 
 // The page itself.
 extern const std::string_view kSettingsPage;

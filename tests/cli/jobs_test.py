@@ -1,5 +1,5 @@
 #!/usr/bin/python3
-"""Every command line of docs/jobs.md works as it stands, one after the other, and leaves something to see."""
+"""Every command line of docs/user/jobs.md works as it stands, one after the other, and leaves something to see."""
 import os
 import subprocess
 import sys
@@ -45,7 +45,7 @@ def prepare(folder):
 
 
 def jobs():
-    for line in (PROJECT / "docs/jobs.md").read_text(encoding="utf-8").splitlines():
+    for line in (PROJECT / "docs/user/jobs.md").read_text(encoding="utf-8").splitlines():
         if line.startswith("    "):
             yield line.strip()
 

@@ -43,7 +43,7 @@ TEST(SetupPages, ShowSettingsThatDoSomethingAndExplainThem) {
   for (const SetupItem& item : SetupItems()) {
     const KeyRow& row = KeyOf(item.key);
     EXPECT_NE(row.control, 0u) << row.name << " has no control number in settings.def";
-    EXPECT_TRUE(HasHelpEntry(row.name)) << row.name << " has no entry in docs/settings.md";
+    EXPECT_TRUE(HasHelpEntry(row.name)) << row.name << " has no entry in docs/user/settings.md";
     EXPECT_TRUE(used.contains(row.name)) << row.name << " is in Setup, but nothing reads it";
   }
 }

@@ -5,7 +5,7 @@
 #include "operations/engine.h"
 #include "processing/pictures.h"
 
-// Expected values are computed here from the formulas that docs/effects.md states, for a grid of
+// Expected values are computed here from the formulas that docs/user/effects.md states, for a grid of
 // colors.
 namespace fotomill::test {
 namespace {

@@ -43,7 +43,7 @@ TEST(KeyHelp, ExplainsTheKeysThatAreUsedAndNoOthers) {
   for (const KeyRow& row : Keys()) {
     const bool isUsed = used.contains(row.name);
     EXPECT_TRUE(!isUsed || kWithoutEffect.contains(row.name) || IsKeyUsed(row))
-        << row.name << " needs an entry in docs/settings.md";
+        << row.name << " needs an entry in docs/user/settings.md";
     EXPECT_TRUE(isUsed || !IsKeyUsed(row)) << row.name << " is read nowhere";
     EXPECT_EQ(KeyHelp(row).empty(), !IsKeyUsed(row));
   }

@@ -5,10 +5,10 @@
 
 namespace fotomill::desktop {
 
-// Pages of the documentation that the program carries with it, as docs/ has them; docs/settings.md
-// is in settings/key_help.h.
-extern const std::string_view kConfigurationPage;  // docs/configuration.md
-extern const std::string_view kDesktopPage;        // docs/desktop.md, the manual
+// Pages of the documentation that are part of the program; docs/user/settings.md is in
+// settings/key_help.h.
+extern const std::string_view kConfigurationPage;  // docs/user/configuration.md
+extern const std::string_view kDesktopPage;        // docs/user/desktop.md, the manual
 
 // A text of the documentation, ready to be shown.
 struct HelpText {

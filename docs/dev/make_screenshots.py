@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""Makes the pictures of docs/desktop.md: paints landscapes, shows them in the real program, keeps what is on the screen.
+"""Makes the pictures of docs/user/desktop.md: paints landscapes, shows them in the real program, keeps what is on the screen.
 
 make_screenshots.py; needs Xvfb and xdotool, and the release build.
 """
@@ -11,7 +11,7 @@ import sys
 import tempfile
 from pathlib import Path
 
-PROJECT = Path(__file__).resolve().parents[1]
+PROJECT = Path(__file__).resolve().parents[2]
 sys.path.insert(0, str(PROJECT / "tests/desktop"))
 from driven_desktop import Desktop  # noqa: E402
 
@@ -80,7 +80,7 @@ def keep(desktop, name):
     made = PROJECT / f"build/screenshots/{name}.png"
     # Written anew by our own encoder, which takes a fraction of the space.
     subprocess.run([PROJECT / "build/release/fotomill", "convert", made, "--out",
-                    PROJECT / f"docs/{name}.png", "--overwrite", "replace"],
+                    PROJECT / f"docs/user/{name}.png", "--overwrite", "replace"],
                    check=True, stdout=subprocess.DEVNULL)
 
 
