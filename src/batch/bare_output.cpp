@@ -36,7 +36,7 @@ BareOutput MakeBareOutput(const PictureRecord& picture, bool upright) {
   if (turns && row.turnsWithoutLoss) {
     if (TurnUprightWithoutLoss(file.Bytes(), turned) != Status::Ok) return output;
     if (turned.empty()) {
-      output.note = TrRecorded("It cannot be turned without loss, so it was encoded again.");
+      output.note = TrRecorded("It cannot be rotated losslessly, so it was re-encoded.");
       output.asSource = true;
       return output;
     }
@@ -45,7 +45,7 @@ BareOutput MakeBareOutput(const PictureRecord& picture, bool upright) {
   if (status != Status::Ok || !file.Intact()) {
     output.file.clear();
     output.asSource = true;
-    output.note = TrRecorded("It is not laid out as its format says, so it was encoded again.");
+    output.note = TrRecorded("Its structure does not follow the format, so it was re-encoded.");
   }
   return output;
 }

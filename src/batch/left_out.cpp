@@ -17,11 +17,11 @@ struct Unread {
   const char* name;
 };
 constexpr Unread kUnread[] = {
-    {kUnreadDepth, false, TrLater("samples of more than 8 bits")},
-    {kUnreadInks, false, TrLater("inks or further channels")},
+    {kUnreadDepth, false, TrLater("more than 8 bits per sample")},
+    {kUnreadInks, false, TrLater("inks or extra channels")},
     {kUnreadLayers, false, TrLater("layers")},
     {kUnreadIptc, true, TrLater("IPTC")},
-    {kUnreadTexts, true, TrLater("further texts")},
+    {kUnreadTexts, true, TrLater("other texts")},
 };
 
 bool HasMakerNote(const PictureRecord& picture) {

@@ -55,7 +55,7 @@ Status ChooseQuality(PictureRecord& picture, const OutputTarget& target, WriteOp
   if (status == Status::Ok) write.encode.SetQuality(best);
   picture.fileName = source;
   if (status == Status::UnsuitableImage)
-    hint = Tr("At the lowest quality it has %1 bytes.", ThousandsText(smallest));
+    hint = Tr("Even at the lowest quality it has %1 bytes.", ThousandsText(smallest));
   return status;
 }
 
@@ -104,12 +104,13 @@ Status OutputWriter::Prepare(PreparedOutput& output, std::string& hint) const {
   const ProfileColors colors = ColorsOfProfile(picture.metadata.icc);
   RETURN_IF_BAD(FitPicture(picture, row, fit, hint));
   if (!upright && OrientationOf(picture) == Orientation::Upright)
-    output.detail.Append(TrRecorded("Turned upright."));
+    output.detail.Append(TrRecorded("Rotated upright."));
   if (profile && picture.metadata.icc.empty()) {
     if (colors == ProfileColors::Rgb || colors == ProfileColors::Gray) {
       output.detail.Append(TrRecorded("Colors converted to sRGB."));
     } else {  // of other colors than the pixels, or no profile at all
-      output.note.Append(TrRecorded("Its color profile does not suit it and was left out."));
+      output.note.Append(
+          TrRecorded("Its color profile does not match the picture and was left out."));
     }
   }
   // frames keep what is transparent where a single picture is flattened

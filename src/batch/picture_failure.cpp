@@ -25,7 +25,7 @@ std::string_view LooksLike(const std::string& fileName, int32_t formatIndex) {
 
 std::string MisnamedRemark(const PictureRecord& picture) {
   if (!OpenedByContents(picture)) return {};
-  return Tr("The contents are %1, whatever the name says.",
+  return Tr("The file contains %1, despite its name.",
             FormatRow(picture.formatIndex).extension.view());
 }
 
@@ -40,7 +40,7 @@ std::string OpenHint(const std::string& fileName, Status status) {
   }
   const int32_t index = FindFormatByName(fileName);
   if (const std::string_view name = LooksLike(fileName, index); !name.empty()) {
-    return Tr("It looks like %1.", Tr(name));
+    return Tr("The contents look like %1.", Tr(name));
   }
   if (index == kNoFormat) return Tr("Unknown file extension.");
   if (!CanRead(FormatRow(index))) return Tr(WhyNot(FormatRow(index)));

@@ -101,7 +101,7 @@ class Turning {
         platform::SetModificationTime(destination_, *time))
       return Status::Ok;
     return Fail(Status::ErrorWritingFile,
-                Tr("The file was turned, but its time could not be set."));
+                Tr("The file was rotated, but its time could not be set."));
   }
 
   Status TurnAsJpeg() {

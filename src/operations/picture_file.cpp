@@ -49,7 +49,7 @@ RecordedText PictureFileProblem(const std::string& name) {
   PicturePointer picture;
   const Status status = LoadPictureInfo({.fileName = PathOf(name)}, picture);
   if (status == Status::Ok) return {};
-  return TrRecorded("names no picture that can be read: %1", name);
+  return TrRecorded("names a picture that cannot be read: %1", name);
 }
 
 }  // namespace fotomill

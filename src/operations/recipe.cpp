@@ -28,9 +28,9 @@ constexpr Parameter kSave[] = {
     {.name = "name", .kind = kText, .preset = "", .least = 0, .most = kLongestText, .label = "Name",
      .help = "Name of the file without extension; may have macros."},
     {.name = "quality", .kind = kInteger, .preset = "", .least = 1, .most = 100, .label = "Quality",
-     .help = "Of formats with lossy compression."},
-    {.name = "max-bytes", .kind = kText, .preset = "", .least = 0, .most = 20, .label = "Most bytes",
-     .help = "The best quality whose file is at most this large, such as 200k."},
+     .help = "Quality of lossy compression."},
+    {.name = "max-bytes", .kind = kText, .preset = "", .least = 0, .most = 20, .label = "Maximum bytes",
+     .help = "Uses the best quality that keeps the file within this size, such as 200k."},
 };
 
 bool IsName(std::string_view text) {
@@ -243,7 +243,7 @@ class Reader {
       place = next++;
       if (place >= rows.size())
         return AddMistake(line.number, operation, word.text,
-                          TrRecorded("is more than the operation takes"));
+                          TrRecorded("is one value too many"));
     }
     if (arguments.At(place).given)
       return AddMistake(line.number, operation, rows[place].name, TrRecorded("is given twice"));

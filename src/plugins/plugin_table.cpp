@@ -150,7 +150,7 @@ int32_t ScanPlugins(const std::string& folder) {
     if (!module.on) continue;
     const std::string path = platform::JoinFolder(module.folder, module.name);
     if (IsBadModule(path)) {
-      Unloadable()[path] = Tr("it ended the program when it was loaded");
+      Unloadable()[path] = Tr("it crashed the program when it was loaded");
       continue;
     }
     int32_t registered = 0;

@@ -171,7 +171,7 @@ std::string DefaultValueText(const KeyRow& row) {
 }
 
 RecordedText ValuesText(const KeyRow& row) {
-  if ((row.type & KEY_INTERNAL) != 0) return TrRecorded("nothing: the program sets it");
+  if ((row.type & KEY_INTERNAL) != 0) return TrRecorded("nothing; the program sets it");
   if ((row.type & KEY_TEXT) == 0) return NumberValues(row);
   if ((row.type & KEY_DESTINATION) != 0)
     return TrRecorded("the extension of a format that can be written");

@@ -315,7 +315,7 @@ def left_out(folder):
     scene().save(folder / "note.jpg", exif=note)
     scene().save(folder / "plain.png")
     for source, to, message in (
-            ("deep.png", "png", "Left out: samples of more than 8 bits."), ("texts.png", "png", "Left out: further texts."),
+            ("deep.png", "png", "Left out: more than 8 bits per sample."), ("texts.png", "png", "Left out: other texts."),
             ("clear.png", "jpg", "Left out: transparency."), ("clear.png", "png", None), ("pages.tif", "png", "Left out: 2 more pages."),
             ("moving.gif", "bmp", "Left out: 4 more frames."), ("camera.jpg", "bmp", "Left out: EXIF, comment."), ("camera.jpg", "png", None),
             ("news.jpg", "png", "Left out: IPTC."), ("note.jpg", "tif", "Left out: maker note."), ("note.jpg", "png", None), ("plain.png", "bmp", None)):
@@ -512,7 +512,7 @@ def animations(folder):
             check(Image.open(made).size == (40, 60), f"{name} stripped and upright: {Image.open(made).size}")
     scene().convert("CMYK").save(folder / "inks.jpg")
     result = run("convert", folder / "inks.jpg", "-o", folder / "inks.png")
-    check("Left out: inks or further channels." in result.stderr, f"inks of a JPEG: {result.stderr}")
+    check("Left out: inks or extra channels." in result.stderr, f"inks of a JPEG: {result.stderr}")
     frames[0].save(folder / "said.gif", save_all=True, append_images=frames[1:], comment=b"hello")
     run("convert", folder / "said.gif", "-o", folder / "again.gif")
     check(Image.open(folder / "again.gif").info.get("comment") == b"hello", "a GIF's comment")

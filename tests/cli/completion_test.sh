@@ -68,7 +68,7 @@ if command -v zsh > /dev/null; then
   zshCheck fotomill "" "convert:convert pictures to another format"
   zshCheck fotomill config "" "unset:reset a key to its default"
   zshCheck fotomill --color never config get "" "UndoLevels:How many file operations"
-  zshCheck fotomill config get "" "ArchiveSortMode:not used by this build"
+  zshCheck fotomill config get "" "ArchiveSortMode:unused in this build"
   zshCheck fotomill --set "" "UndoLevels=:How many"
   zshCheck fotomill convert --overwrite "" "keep-both:"
   zshCheck fotomill convert --overwrite= "keep-both:"

@@ -232,7 +232,7 @@ TEST_F(FileCommands, OpensFilesWhoseNamesLie) {
   EXPECT_EQ(facts["looksLike"], "JPEG");
   const json honest = json::parse(RunCommand({"info", "--json", In("a.bmp")}).out)[0];
   EXPECT_FALSE(honest.contains("looksLike"));
-  EXPECT_THAT(RunCommand({"info", In("photo.png")}).out, HasSubstr("The contents are JPG"));
+  EXPECT_THAT(RunCommand({"info", In("photo.png")}).out, HasSubstr("The file contains JPG"));
   EXPECT_EQ(RunCommand({"verify", In("photo.png")}).status, 0);
   EXPECT_EQ(RunCommand({"convert", In("photo.png"), "--to", "bmp"}).status, 0);
   EXPECT_EQ(ReadBytes(In("photo.bmp")).size(), BitmapFile(5, 3, 24).size());

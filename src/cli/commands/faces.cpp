@@ -90,12 +90,11 @@ void SetUpFaces(CLI::App& app, CommandContext& context) {
   AddSelection(app, options->selection, context);
   AddFlag(app, "--json", options->json,
           "Print a JSON array of {file, width, height, faces, status, message}");
-  SetFooter(
-      app,
-      "Prints a line WIDTHxHEIGHT+X+Y for each face, in pixels of the picture turned upright. "
-      "The keys FaceDetectThumbnailCascade and FaceDetectPercentage choose the classifier and "
-      "the smallest face that counts.",
-      "fotomill faces -r holiday --json");
+  SetFooter(app,
+            "Prints a line WIDTHxHEIGHT+X+Y for each face, in pixels of the upright picture. The "
+            "keys FaceDetectThumbnailCascade and FaceDetectPercentage choose the classifier and "
+            "the smallest face reported.",
+            "fotomill faces -r holiday --json");
   context.run = [options, &context] { return RunFaces(*options, context); };
 }
 

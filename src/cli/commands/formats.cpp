@@ -96,7 +96,7 @@ void SetUpFormats(CLI::App& app, CommandContext& context) {
   Exclude(destinations, json);
   Exclude(destinations, filter);
   Exclude(filter, json);
-  SetFooter(app, "Columns: index, extension, what this build can do, description.",
+  SetFooter(app, "Columns: index, extension, capabilities of this build, description.",
             "fotomill formats --json");
   context.run = [options, &context] { return RunFormats(*options, context); };
 }

@@ -177,8 +177,9 @@ void SetUpHistoryAdd(CLI::App& app, CommandContext& context) {
   context.names.Declare("FILE", "The file that was used", 1, 1);
   const auto options =
       SetUp(app, context, RunAdd, "fotomill history add photo.jpg --function View");
-  Require(AddName(app, "--function", options->function, "NAME|N",
-                  "What was done with it: a name such as \"Get info\", or a number from 0 to 19"));
+  Require(AddName(
+      app, "--function", options->function, "NAME|N",
+      "What was done with it: a function name such as \"Get info\", or a number from 0 to 19"));
   AddNumber(app, "--created", options->created, "SECONDS", INT32_MIN, INT32_MAX,
             "When the file was created, in seconds since 1970 UTC (default: its own time)");
   AddNumber(app, "--accessed", options->accessed, "SECONDS", INT32_MIN, INT32_MAX,

@@ -123,11 +123,10 @@ int RunMatch(const MatchOptions& options, const CommandContext& context) {
 void SetUpMatch(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<MatchOptions>();
   context.names.Declare("NAME...", "File names; without --contents they need not exist", 1);
-  AddFlag(app, "--contents", options->contents,
-          "Open the files and tell which format they really are");
+  AddFlag(app, "--contents", options->contents, "Open the files and detect their real format");
   AddFlag(app, "--json", options->json,
-          "Print a JSON array of {name, index, extension, typeName}; with --contents also of what "
-          "the files hold");
+          "Print a JSON array of {name, index, extension, typeName}; with --contents, also the "
+          "detected format");
   SetFooter(app,
             "The exit status is 1 if a name selects no format or, with --contents, a file cannot "
             "be opened.",

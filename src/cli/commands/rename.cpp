@@ -41,7 +41,7 @@ int RunUndo(const RenameCommandOptions& options, const std::vector<SelectedFile>
   if (UndoRename(only, options.dryRun, job)) return kExitOk;
   output.Message(
       std::string("fotomill: ") +
-      WithReason(Tr("The record of the last renaming in the data folder cannot be read.")));
+      WithReason(Tr("The record of the last renaming, in the data folder, cannot be read.")));
   return kExitFailed;
 }
 

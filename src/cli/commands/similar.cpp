@@ -114,8 +114,8 @@ class Search {
   void Keep() {
     if (store_.Save() || complained_) return;
     complained_ = true;
-    output_.Note(Tr("What was found out about pictures cannot be kept in \"%1\".",
-                    output_.ShownMessage(DataFile(kHashStoreName))));
+    output_.Note(
+        Tr("Results cannot be stored in \"%1\".", output_.ShownMessage(DataFile(kHashStoreName))));
   }
 
   // What the store knows. It belongs to the calling thread, so this is done before work begins.
@@ -250,15 +250,14 @@ void SetUpSimilar(CLI::App& app, CommandContext& context) {
   options->distance = -1;  // as the configuration says
   AddSelection(app, options->selection, context);
   AddNumber(app, "--distance", options->distance, "N", 0, kMostDistance,
-            "In how many of 64 bits pictures may differ (default: the key FindSimlarDistance)");
-  AddFlag(app, "--transforms", options->transforms,
-          "Also find pictures that are turned or mirrored");
-  AddFlag(app, "--exact", options->exact, "Find pictures that are equal pixel by pixel");
+            "How many of 64 bits may differ (default: the key FindSimlarDistance)");
+  AddFlag(app, "--transforms", options->transforms, "Also find rotated or mirrored copies");
+  AddFlag(app, "--exact", options->exact, "Only find pictures with identical pixels");
   AddFlag(app, "--json", options->json,
           "Print a JSON array of {distance, files: [{file, width, height, bytes}]}");
   SetFooter(app,
-            "Prints groups of files, with size in pixels and in bytes. What was found out about a picture is kept in the data folder, "
-            "so that a second search reads no picture again.",
+            "Prints groups of files, with size in pixels and in bytes. Results are stored in the "
+            "data folder, so a second search does not read the pictures again.",
             "fotomill similar -r --distance 6 holiday");
   context.run = [options, &context] { return RunSimilar(*options, context); };
 }

@@ -128,7 +128,7 @@ void SetUpTurn(CLI::App& app, CommandContext& context) {
   Exclude(out, dest);
   AddChoice(app, "--overwrite", options->overwrite, "HOW",
             "If the output exists in --dest: keep-both (default), replace or skip", {"keep-both", "replace", "skip"});
-  AddFlag(app, "--trim", options->trim, "Crop JPEG edges that cannot be turned losslessly");
+  AddFlag(app, "--trim", options->trim, "Crop JPEG edges that cannot be rotated losslessly");
   AddFlag(app, "--keep-tree", options->keepTree, "Recreate the source folders in --dest");
   AddFlag(app, "--keep-times", options->keepTimes, "Keep the modification times of the sources");
   AddNumber(app, "-j,--jobs", options->jobs, "N", 0, INT32_MAX,
@@ -137,9 +137,9 @@ void SetUpTurn(CLI::App& app, CommandContext& context) {
   AddFlag(app, "--json", options->json,
           "Print a JSON array of {file, destination, status, message}");
   SetFooter(app,
-            "JPEG pictures are turned losslessly. If the size is not a multiple of the block size (8 or 16 pixels), only the\n"
-            "EXIF orientation is changed and a message says so; --trim crops the edges instead. Files of other formats are\n"
-            "rewritten if no pixel changes.",
+            "JPEG pictures are rotated losslessly. If the size is not a multiple of the block size "
+            "(8 or 16 pixels), only the\nEXIF orientation is changed and a message says so; --trim "
+            "crops the edges instead. Files of other formats are\nrewritten if no pixel changes.",
             "fotomill turn --by-exif --in-place holiday -r");
   context.run = [options, &context] { return RunTurnCommand(*options, context); };
 }

@@ -27,7 +27,7 @@ std::vector<Word> KeyWords(const char* suffix) {
   for (const KeyRow& row : Keys()) {
     const std::string summary = KeySummary(row);
     words.push_back({std::string(row.name) + suffix,
-                     summary.empty() ? Tr("not used by this build") : OneLine(summary)});
+                     summary.empty() ? Tr("unused in this build") : OneLine(summary)});
   }
   return words;
 }

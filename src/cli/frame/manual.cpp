@@ -120,8 +120,8 @@ std::string MainPage() {
   }
   text += OptionSections(parser);
   text += Section(Tr("ENVIRONMENT")) +
-          Entry("FOTOMILL_DATA", "", Tr("Data folder, where --data does not name one.")) +
-          Entry("NO_COLOR", "", Tr("No color, when it is set to anything.")) +
+          Entry("FOTOMILL_DATA", "", Tr("Data folder, unless --data names one.")) +
+          Entry("NO_COLOR", "", Tr("Disables color if set to anything.")) +
           Entry("LANG, LC_ALL, LANGUAGE", "", Tr("Language of messages."));
   text += Section(Tr("EXAMPLES")) + ".EX\n" +
           Roff(
@@ -134,7 +134,7 @@ std::string MainPage() {
 
 int WriteManual(const std::string& folder, const CommandContext& context) {
   if (!platform::MakeFolders(folder))
-    return UsageError(context, WithReason(Tr("The folder \"%1\" cannot be made.", folder)));
+    return UsageError(context, WithReason(Tr("The folder \"%1\" could not be created.", folder)));
   for (const auto& [name, text] : ManualPages()) {
     const std::string path = platform::JoinFolder(folder, name);
     if (platform::WriteWholeFile(path, text)) continue;
@@ -155,7 +155,7 @@ std::vector<std::pair<std::string, std::string>> ManualPages() {
 }
 
 void SetUpManual(CLI::App& app, CommandContext& context) {
-  context.names.Declare("DIR", "Folder for the pages, made if needed", 1, 1);
+  context.names.Declare("DIR", "Folder for the pages, created if needed", 1, 1);
   SetFooter(app, nullptr, "fotomill manual ~/.local/share/man/man1");
   context.run = [&context] { return WriteManual(context.names.values[0], context); };
 }

@@ -98,7 +98,7 @@ Status LoadRaw(std::span<const uint8_t> file, const ReadRequest& request, bool d
     SwapRow(pixels.Row(facts, y), image.Row(y), facts.width);
     RETURN_IF_BAD(picture.ReportRow(y));
   }
-  if (pixels.damaged) picture.warning.AssignCut(TrLater("The sensor's data are damaged."));
+  if (pixels.damaged) picture.warning.AssignCut(TrLater("The sensor data is damaged."));
   picture.image = std::move(image);
   return Status::Ok;
 }

@@ -14,7 +14,7 @@ using namespace std::string_view_literals;
 constexpr Signature kSignatures[] = {{0, "II\x2a\0"sv}, {0, "MM\0\x2a"sv}};
 
 constexpr FormatLibrary kLibraries[] = {
-    {"LibRaw", RawLibraryVersion, TrLater("raw files of cameras, loaded when needed")}};
+    {"LibRaw", RawLibraryVersion, TrLater("camera raw files, loaded when needed")}};
 
 constexpr FormatEntry kRows[] = {{
     .info = KdcInfo,

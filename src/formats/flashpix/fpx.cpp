@@ -34,7 +34,8 @@ Status DescribePicture(const FpxFile& fpx, const FpxSize& size, PictureRecord& p
   }
   picture.warning.Clear();
   if (fpx.HasTransform())
-    picture.warning.AssignCut(TrLater("Turns, crops and color changes of the view are not shown."));
+    picture.warning.AssignCut(
+        TrLater("Rotation, crop and color changes of the view are not shown."));
   return Status::Ok;
 }
 

@@ -69,8 +69,7 @@ Status DescribePicture(const PspFile& psp, int32_t page, PictureRecord& picture)
   const bool plain =
       std::ranges::all_of(psp.layers, [](const PspLayer& layer) { return layer.blendMode == 0; });
   if (page == 0 && !psp.composite.HasPixels() && (psp.otherLayers > 0 || !plain)) {
-    picture.warning.AssignCut(
-        TrLater("Layers that are not plain pixels are not shown as they should be."));
+    picture.warning.AssignCut(TrLater("Layers other than plain pixels are not shown correctly."));
   }
   if (indexed) {
     picture.palette = psp.hasPalette ? psp.palette : GrayRamp();

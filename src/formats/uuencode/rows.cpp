@@ -12,7 +12,7 @@ using namespace std::string_view_literals;
 constexpr Signature kSignatures[] = {{0, "begin "sv, "UUE"}};
 
 constexpr FormatSetting kKeys[] = {
-    {"RelaxedUUE", TrLater("Pass over damaged lines")},
+    {"RelaxedUUE", TrLater("Skip damaged lines")},
 };
 constexpr FormatSettings kSettings = {"UUE", "OverrideUueBox", TrLater("UUEncoded"), kKeys};
 

@@ -34,8 +34,7 @@ constexpr Parameter kCrop[] = {
      .preset = "center",
      .choices = kGravitiesAndFaces,
      .label = "Place",
-     .help = "Which part to keep of an area without a place; faces: the part around the faces, the "
-             "center where there are none."},
+     .help = "Which part to keep if the area has no position; faces: around the faces, or the center if there are none."},
 };
 
 // Moves an area so that the middle of the faces comes as close to its middle as the picture allows.
@@ -64,9 +63,9 @@ Status Crop(PictureRecord& picture, const Arguments& arguments, const OperationC
 
 constexpr Parameter kTrim[] = {
     {.name = "fuzz", .kind = kInteger, .unit = "levels", .preset = "0", .least = 0, .most = 255, .label = "Fuzz",
-     .help = "How far a pixel may be from the top left pixel and still be cut off."},
+     .help = "How much a pixel may differ from the top left pixel and still count as border."},
     {.name = "margin", .kind = kInteger, .unit = "px", .preset = "0", .least = 0, .most = 100000, .label = "Margin",
-     .help = "How much of the border stays."},
+     .help = "Width of the border to keep."},
 };
 
 Status Trim(PictureRecord& picture, const Arguments& arguments, const OperationContext&) {
@@ -79,10 +78,10 @@ Status Trim(PictureRecord& picture, const Arguments& arguments, const OperationC
 
 constexpr Parameter kCanvas[] = {
     {.name = "size", .kind = kSize, .unit = "px", .least = 0.0001, .most = 1e9, .label = "Size",
-     .help = "WxH, Wx or xH; or one value for both edges. What does not fit is cut off."},
+     .help = "WxH, Wx or xH, or one value for both edges. What does not fit is cut off."},
     {.name = "gravity", .kind = kChoice, .preset = "center", .choices = kGravities, .label = "Place",
      .help = "Where the picture is on the canvas."},
-    {.name = "background", .kind = kColor, .preset = "#ffffff", .label = "Background", .help = "The color of the rest.",
+    {.name = "background", .kind = kColor, .preset = "#ffffff", .label = "Background", .help = "Color of the added area.",
      .key = "AlphaBackground"},
 };
 

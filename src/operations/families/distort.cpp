@@ -21,11 +21,11 @@ constexpr Parameter kSeed = {.name = "seed",
                              .help = "Another number gives another pattern."};
 constexpr Parameter kNoise[] = {
     {.name = "kind", .kind = kChoice, .preset = "gaussian", .choices = "uniform|gaussian|salt-pepper", .label = "Kind",
-     .help = "How levels change: evenly, most of them little, or a few pixels to black and white."},
+     .help = "Distribution: uniform, Gaussian, or single pixels set to black and white."},
     {.name = "amount", .kind = kPercent, .unit = "%", .preset = "10", .least = 0, .most = 100, .label = "Amount",
      .help = "The largest change, the standard deviation, or the share of pixels."},
     kSeed,
-    {.name = "gray", .kind = kFlag, .preset = "no", .label = "Gray", .help = "Changes brightness and not color."},
+    {.name = "gray", .kind = kFlag, .preset = "no", .label = "Gray", .help = "Changes brightness only, not color."},
 };
 
 Status Noise(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
@@ -73,7 +73,7 @@ constexpr Parameter kCenter = {.name = "center",
                                .unit = "px",
                                .preset = "50%,50%",
                                .label = "Center",
-                               .help = "The middle of it."};
+                               .help = "Center of the effect."};
 constexpr Parameter kRadius = {.name = "radius",
                                .kind = kLength,
                                .unit = "px",
@@ -81,7 +81,7 @@ constexpr Parameter kRadius = {.name = "radius",
                                .least = 0.001,
                                .most = 1e9,
                                .label = "Radius",
-                               .help = "How far it reaches; percent are of the shorter edge."};
+                               .help = "Radius of the effect; percentages refer to the shorter edge."};
 
 AreaPoint CenterOf(const PictureRecord& picture, const Arguments& arguments,
                    const OperationContext& context) {
@@ -118,7 +118,7 @@ Status Wave(PictureRecord& picture, const Arguments& arguments, const OperationC
 
 constexpr Parameter kSwirl[] = {
     {.name = "angle", .kind = kAngle, .unit = "degrees", .preset = "90", .least = -3600, .most = 3600, .label = "Angle",
-     .help = "How far the center turns, clockwise."},
+     .help = "Rotation at the center, clockwise."},
     kRadius, kCenter,
 };
 
@@ -130,7 +130,7 @@ Status Swirl(PictureRecord& picture, const Arguments& arguments, const Operation
 
 constexpr Parameter kBulge[] = {
     {.name = "amount", .kind = kPercent, .unit = "%", .preset = "50", .least = -100, .most = 100, .label = "Amount",
-     .help = "How much the center grows, or shrinks below 0."},
+     .help = "How much the center is enlarged; below 0 it shrinks."},
     kRadius, kCenter,
 };
 
@@ -162,7 +162,7 @@ constexpr Operation kOperations[] = {
     {.name = "ripple",
      .family = Family::Filter,
      .label = "Ripple",
-     .help = "Rings on water.",
+     .help = "Distorts the picture like rings on water.",
      .example = "ripple 3 20",
      .parameters = kRipple,
      .works = Works::Neighborhood,
@@ -171,7 +171,7 @@ constexpr Operation kOperations[] = {
     {.name = "wave",
      .family = Family::Filter,
      .label = "Wave",
-     .help = "Lets columns or rows swing.",
+     .help = "Shifts columns or rows along a sine wave.",
      .example = "wave 4 30",
      .parameters = kWave,
      .works = Works::Neighborhood,
@@ -180,7 +180,7 @@ constexpr Operation kOperations[] = {
     {.name = "swirl",
      .family = Family::Filter,
      .label = "Swirl",
-     .help = "Turns the picture around a center, less further out.",
+     .help = "Twists a picture around a center.",
      .example = "swirl 120",
      .parameters = kSwirl,
      .works = Works::WholePicture,
@@ -188,7 +188,7 @@ constexpr Operation kOperations[] = {
     {.name = "bulge",
      .family = Family::Filter,
      .label = "Bulge",
-     .help = "Enlarges or shrinks the center as a lens does.",
+     .help = "Enlarges or shrinks the center like a lens.",
      .example = "bulge -40%",
      .parameters = kBulge,
      .works = Works::WholePicture,

@@ -51,12 +51,12 @@ constexpr Parameter kCurves[] = {
 };
 constexpr Parameter kAutoLevels[] = {
     {.name = "clip", .kind = kPercent, .unit = "%", .preset = "0.1", .least = 0, .most = 49, .label = "Clip",
-     .help = "Share of the pixels that may become black, and white."},
-    {.name = "mode", .kind = kChoice, .preset = "each", .choices = "each|together", .label = "Channels", .help = "each stretches every channel on its own, together keeps hues."},
+     .help = "Share of the pixels that may become pure black, and pure white."},
+    {.name = "mode", .kind = kChoice, .preset = "each", .choices = "each|together", .label = "Channels", .help = "each stretches every channel separately; together keeps hues."},
 };
 constexpr Parameter kEqualize[] = {
     {.name = "mode", .kind = kChoice, .preset = "each", .choices = "each|together", .label = "Channels",
-     .help = "each treats every channel on its own, together keeps grays gray."},
+     .help = "each equalizes every channel separately; together keeps grays gray."},
 };
 constexpr Parameter kSaturation[] = {
     {.name = "s", .kind = kPercent, .unit = "%", .preset = "100", .least = 0, .most = 400, .label = "Saturation",
@@ -85,7 +85,7 @@ constexpr Parameter kThreshold[] = {
 };
 constexpr Parameter kPosterize[] = {
     {.name = "n", .kind = kInteger, .preset = "4", .least = 2, .most = 256, .label = "Levels",
-     .help = "Levels that each channel keeps."},
+     .help = "Number of levels left in each channel."},
 };
 constexpr Parameter kSolarize[] = {
     {.name = "t", .kind = kInteger, .unit = "levels", .preset = "128", .least = 0, .most = 256, .label = "Threshold",
@@ -102,7 +102,7 @@ constexpr Parameter kChannels[] = {
      .preset = "",
      .choices = "red|green|blue|alpha",
      .label = "Keep",
-     .help = "Shows one channel in gray; alpha is taken off the picture then."},
+     .help = "Shows one channel in gray; alpha is removed."},
     {.name = "swap",
      .kind = kChoice,
      .preset = "",
@@ -121,7 +121,7 @@ constexpr Parameter kVignette[] = {
     {.name = "amount", .kind = kPercent, .unit = "%", .preset = "50", .least = 0, .most = 100, .label = "Amount",
      .help = "Share of the color in the corners."},
     {.name = "size", .kind = kPercent, .unit = "%", .preset = "40", .least = 0, .most = 99, .label = "Size",
-     .help = "Share of the way from the center to the corners that stays as it is."},
+     .help = "Share of the distance from center to corners that stays unchanged."},
     {.name = "color", .kind = kColor, .preset = "#000000", .label = "Color", .help = "What the edges fade into."},
 };
 
@@ -354,7 +354,7 @@ constexpr Operation kEffects[] = {
     {.name = "equalize",
      .family = Family::Effects,
      .label = "Equalize",
-     .help = "Makes all levels about equally frequent.",
+     .help = "Spreads the levels so that all are about equally frequent.",
      .example = "equalize",
      .parameters = kEqualize,
      .works = Works::WholePicture,
@@ -378,7 +378,7 @@ constexpr Operation kEffects[] = {
     {.name = "temperature",
      .family = Family::Effects,
      .label = "Temperature",
-     .help = "Makes the light of a picture warmer or colder.",
+     .help = "Makes a picture warmer or colder.",
      .example = "temperature 20",
      .parameters = kTemperature,
      .works = Works::Point,
@@ -403,7 +403,7 @@ constexpr Operation kEffects[] = {
     {.name = "gray",
      .family = Family::Effects,
      .label = "Gray",
-     .help = "Replaces colors by their brightness.",
+     .help = "Replaces colors with their brightness.",
      .example = "gray",
      .parameters = {},
      .works = Works::Point,
@@ -411,7 +411,7 @@ constexpr Operation kEffects[] = {
     {.name = "sepia",
      .family = Family::Effects,
      .label = "Sepia",
-     .help = "Gives a picture the brown of old photographs.",
+     .help = "Gives a picture the brown tone of old photographs.",
      .example = "sepia",
      .parameters = kSepia,
      .works = Works::Point,
@@ -427,7 +427,7 @@ constexpr Operation kEffects[] = {
     {.name = "posterize",
      .family = Family::Effects,
      .label = "Posterize",
-     .help = "Leaves a few levels of each channel.",
+     .help = "Reduces each channel to a few levels.",
      .example = "posterize 5",
      .parameters = kPosterize,
      .works = Works::Point,
@@ -443,7 +443,7 @@ constexpr Operation kEffects[] = {
     {.name = "colorize",
      .family = Family::Effects,
      .label = "Colorize",
-     .help = "Replaces all colors by shades of one.",
+     .help = "Replaces all colors with shades of one.",
      .example = "colorize #4070a0",
      .parameters = kColorize,
      .works = Works::Point,

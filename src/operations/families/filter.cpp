@@ -34,9 +34,9 @@ constexpr Parameter kBlur[] = {kSigma};
 constexpr Parameter kUnsharp[] = {
     kSigma,
     {.name = "amount", .kind = kNumber, .preset = "1", .least = 0, .most = 10, .label = "Amount",
-     .help = "How much of the difference to the blurred picture is added; 1 is 100 %."},
+     .help = "How much of the difference from the blurred picture is added; 1 is 100 %."},
     {.name = "threshold", .kind = kNumber, .unit = "levels", .preset = "0", .least = 0, .most = 255, .label = "Threshold",
-     .help = "Smaller differences are left alone."},
+     .help = "Smaller differences are left unchanged."},
 };
 
 GaussianPlace PlaceOf(const OperationContext& context) { return {context.left, context.top}; }
@@ -63,7 +63,7 @@ constexpr Parameter kRadius = {
     .least = 0,
     .most = kMostRankRadius,
     .label = "Radius",
-    .help = "A square of twice as many pixels and one more on each side counts."};
+    .help = "The square has 2 x radius + 1 pixels on each side."};
 constexpr Parameter kWindow[] = {kRadius};
 static_assert(kMostBoxRadius >= kMostRankRadius);
 
@@ -80,7 +80,7 @@ Status ApplyRank(PictureRecord& picture, const Arguments& arguments,
 }
 
 constexpr Parameter kMotion[] = {
-    {.name = "length", .kind = kNumber, .unit = "px", .preset = "10", .least = 1, .most = 1000, .label = "Length", .help = "How far things move."},
+    {.name = "length", .kind = kNumber, .unit = "px", .preset = "10", .least = 1, .most = 1000, .label = "Length", .help = "Distance of the motion."},
     {.name = "angle", .kind = kAngle, .unit = "degrees", .preset = "0", .least = -360, .most = 360, .label = "Angle",
      .help = "The direction; 0 is to the right."},
 };
@@ -96,10 +96,10 @@ int32_t ReachOfMotion(const Arguments& arguments) {
 
 constexpr Parameter kRadial[] = {
     {.name = "kind", .kind = kChoice, .preset = "spin", .choices = "spin|zoom", .label = "Kind",
-     .help = "spin blurs around a center, zoom away from it."},
+     .help = "spin blurs around the center, zoom away from it."},
     {.name = "amount", .kind = kNumber, .preset = "10", .least = 0, .most = 100, .label = "Amount",
      .help = "Degrees of a spin, percent of a zoom."},
-    {.name = "center", .kind = kPoint, .unit = "px", .preset = "50%,50%", .label = "Center", .help = "What stays sharp."},
+    {.name = "center", .kind = kPoint, .unit = "px", .preset = "50%,50%", .label = "Center", .help = "Point that stays sharp."},
 };
 
 Status RadialBlur(PictureRecord& picture, const Arguments& arguments,
@@ -112,9 +112,9 @@ Status RadialBlur(PictureRecord& picture, const Arguments& arguments,
 
 constexpr Parameter kDespeckle[] = {
     {.name = "radius", .kind = kInteger, .unit = "px", .preset = "1", .least = 1, .most = kMostRankRadius, .label = "Radius",
-     .help = "Specks must be smaller than this."},
+     .help = "Largest size of a speck."},
     {.name = "threshold", .kind = kInteger, .unit = "levels", .preset = "20", .least = 0, .most = 255, .label = "Threshold",
-     .help = "How much a speck differs from what is around it."},
+     .help = "How much a speck must differ from its surroundings."},
 };
 
 Status Despeckle(PictureRecord& picture, const Arguments& arguments,
@@ -124,9 +124,9 @@ Status Despeckle(PictureRecord& picture, const Arguments& arguments,
 
 constexpr Parameter kSurface[] = {
     {.name = "radius", .kind = kInteger, .unit = "px", .preset = "3", .least = 1, .most = kMostSurfaceRadius, .label = "Radius",
-     .help = "A square of twice as many pixels and one more on each side counts."},
+     .help = "The square has 2 x radius + 1 pixels on each side."},
     {.name = "threshold", .kind = kInteger, .unit = "levels", .preset = "20", .least = 0, .most = 255, .label = "Threshold",
-     .help = "Pixels that differ more do not count."},
+     .help = "Pixels that differ more are ignored."},
 };
 
 Status SurfaceBlur(PictureRecord& picture, const Arguments& arguments,
@@ -139,7 +139,7 @@ constexpr Parameter kOil[] = {
     {.name = "radius", .kind = kInteger, .unit = "px", .preset = "4", .least = 1, .most = kMostOilRadius, .label = "Radius",
      .help = "The size of the brush."},
     {.name = "levels", .kind = kInteger, .preset = "32", .least = 2, .most = kMostOilLevels, .label = "Levels",
-     .help = "How many shades are told apart."},
+     .help = "Number of shades that are distinguished."},
 };
 
 Status Oil(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
@@ -170,7 +170,7 @@ constexpr Parameter kKernel[] = {
      .kind = kText,
      .most = 4000,
      .label = "Weights",
-     .help = "9, 25, 49 or 81 numbers with blanks or commas between them, row by row."},
+     .help = "9, 25, 49 or 81 numbers, row by row, separated by spaces or commas."},
     {.name = "divisor",
      .kind = kNumber,
      .preset = "",
@@ -178,7 +178,7 @@ constexpr Parameter kKernel[] = {
      .most = 1e6,
      .label = "Divisor",
      .help =
-         "What the sum is divided by; that of the weights when it is left out, or 1 if that is 0."},
+         "The sum is divided by this (default: the sum of the weights, or 1 if that is 0)."},
     {.name = "bias",
      .kind = kNumber,
      .unit = "levels",
@@ -186,7 +186,7 @@ constexpr Parameter kKernel[] = {
      .least = -255,
      .most = 255,
      .label = "Bias",
-     .help = "What is added in the end."},
+     .help = "Added to the result."},
 };
 
 // Numbers with blanks or commas between them; empty when something else is in the text.
@@ -242,8 +242,8 @@ Rectangle AreaOfPart(const PictureRecord& picture, const Value& area,
 }
 
 constexpr Parameter kMosaic[] = {
-    {.name = "size", .kind = kInteger, .unit = "px", .preset = "10", .least = 1, .most = 10000, .label = "Size", .help = "The edge of a square."},
-    {.name = "area", .kind = kRectangle, .unit = "px", .preset = "", .label = "Area", .help = "WxH+X+Y; the whole picture when it is left out."},
+    {.name = "size", .kind = kInteger, .unit = "px", .preset = "10", .least = 1, .most = 10000, .label = "Size", .help = "Edge length of a square."},
+    {.name = "area", .kind = kRectangle, .unit = "px", .preset = "", .label = "Area", .help = "WxH+X+Y (default: the whole picture)."},
 };
 
 Status Mosaic(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
@@ -253,10 +253,10 @@ Status Mosaic(PictureRecord& picture, const Arguments& arguments, const Operatio
 int32_t ReachOfMosaic(const Arguments& arguments) { return arguments.Integer("size"); }
 
 constexpr Parameter kRedEye[] = {
-    {.name = "area", .kind = kRectangle, .unit = "px", .preset = "", .label = "Area", .help = "WxH+X+Y around the eyes; the whole picture where faces are looked for."},
+    {.name = "area", .kind = kRectangle, .unit = "px", .preset = "", .label = "Area", .help = "WxH+X+Y around the eyes (default with faces: the whole picture)."},
     {.name = "sensitivity", .kind = kPercent, .unit = "%", .preset = "50", .least = 0, .most = 100, .label = "Sensitivity",
-     .help = "How little red is enough."},
-    {.name = "faces", .kind = kFlag, .preset = "no", .label = "In faces", .help = "Only in the faces within the area."},
+     .help = "Higher values also correct weaker red."},
+    {.name = "faces", .kind = kFlag, .preset = "no", .label = "In faces", .help = "Only corrects faces within the area."},
 };
 
 Status RedEye(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
@@ -310,7 +310,7 @@ constexpr Operation kOperations[] = {
     {.name = "box-blur",
      .family = Family::Filter,
      .label = "Box blur",
-     .help = "Replaces each pixel by the mean of a square around it.",
+     .help = "Replaces each pixel with the mean of a square around it.",
      .example = "box-blur 3",
      .parameters = kWindow,
      .works = Works::Neighborhood,
@@ -320,7 +320,7 @@ constexpr Operation kOperations[] = {
      .family = Family::Filter,
      .label = "Median",
      .help =
-         "Replaces each pixel by the median of a square around it: removes specks and keeps edges.",
+         "Replaces each pixel with the median of a square around it: removes specks and keeps edges.",
      .example = "median 2",
      .parameters = kWindow,
      .works = Works::Neighborhood,
@@ -329,7 +329,7 @@ constexpr Operation kOperations[] = {
     {.name = "minimum",
      .family = Family::Filter,
      .label = "Minimum",
-     .help = "Replaces each pixel by the darkest level of a square around it: dark parts grow.",
+     .help = "Replaces each pixel with the darkest level in a square around it: dark areas grow.",
      .example = "minimum 2",
      .parameters = kWindow,
      .works = Works::Neighborhood,
@@ -338,7 +338,7 @@ constexpr Operation kOperations[] = {
     {.name = "maximum",
      .family = Family::Filter,
      .label = "Maximum",
-     .help = "Replaces each pixel by the brightest level of a square around it: bright parts grow.",
+     .help = "Replaces each pixel with the brightest level in a square around it: bright areas grow.",
      .example = "maximum 2",
      .parameters = kWindow,
      .works = Works::Neighborhood,
@@ -356,7 +356,7 @@ constexpr Operation kOperations[] = {
     {.name = "radial-blur",
      .family = Family::Filter,
      .label = "Radial blur",
-     .help = "Blurs around a center or away from it.",
+     .help = "Blurs in circles around a center, or away from it.",
      .example = "radial-blur zoom 20",
      .parameters = kRadial,
      .works = Works::WholePicture,
@@ -364,7 +364,7 @@ constexpr Operation kOperations[] = {
     {.name = "despeckle",
      .family = Family::Filter,
      .label = "Despeckle",
-     .help = "Removes specks and leaves the rest alone.",
+     .help = "Removes specks and leaves the rest unchanged.",
      .example = "despeckle threshold=30",
      .parameters = kDespeckle,
      .works = Works::Neighborhood,
@@ -373,7 +373,7 @@ constexpr Operation kOperations[] = {
     {.name = "surface-blur",
      .family = Family::Filter,
      .label = "Surface blur",
-     .help = "Blurs surfaces and keeps edges.",
+     .help = "Smooths surfaces and keeps edges.",
      .example = "surface-blur 4 25",
      .parameters = kSurface,
      .works = Works::Neighborhood,
@@ -391,7 +391,7 @@ constexpr Operation kOperations[] = {
     {.name = "emboss",
      .family = Family::Filter,
      .label = "Emboss",
-     .help = "Makes a gray relief of the picture.",
+     .help = "Turns a picture into a gray relief.",
      .example = "emboss 315 3",
      .parameters = kEmboss,
      .works = Works::Neighborhood,
@@ -400,7 +400,7 @@ constexpr Operation kOperations[] = {
     {.name = "oil",
      .family = Family::Filter,
      .label = "Oil painting",
-     .help = "Makes strokes of one color.",
+     .help = "Paints the picture in strokes of one color.",
      .example = "oil 3",
      .parameters = kOil,
      .works = Works::Neighborhood,
@@ -409,7 +409,7 @@ constexpr Operation kOperations[] = {
     {.name = "mosaic",
      .family = Family::Filter,
      .label = "Mosaic",
-     .help = "Makes squares of one color, to hide a face or a number.",
+     .help = "Turns the area into squares of one color, for example to hide a face or a license plate.",
      .example = "mosaic 8 50%x50%+10+10",
      .parameters = kMosaic,
      .works = Works::Neighborhood,
@@ -417,8 +417,8 @@ constexpr Operation kOperations[] = {
      .reach = ReachOfMosaic},
     {.name = "kernel",
      .family = Family::Filter,
-     .label = "Own filter",
-     .help = "Weighs the pixels around each pixel.",
+     .label = "Custom filter",
+     .help = "Convolves the picture with your own weights.",
      .example = "kernel \"0 -1 0 -1 5 -1 0 -1 0\"",
      .parameters = kKernel,
      .works = Works::Neighborhood,
@@ -427,7 +427,7 @@ constexpr Operation kOperations[] = {
      .check = CheckKernel},
     {.name = "red-eye",
      .family = Family::Filter,
-     .label = "Red eyes",
+     .label = "Red-eye removal",
      .help = "Removes red eyes caused by a flash.",
      .example = "red-eye 50%x50%+10%+10%",
      .parameters = kRedEye,

@@ -25,26 +25,25 @@ constexpr const char* kDitherKeyWords = "none|bayer8|floyd-steinberg";
 // clang-format off
 constexpr Parameter kBidirectional =
     {.name = "bidirectional", .kind = kFlag, .preset = "yes", .label = "Alternate direction of rows",
-     .help = "Error diffusion takes every other row from right to left.", .key = "FXBidirectional"};
+     .help = "Error diffusion processes every other row from right to left.", .key = "FXBidirectional"};
 constexpr Parameter kDitherBrightness =
     {.name = "brightness", .kind = kInteger, .unit = "%", .preset = "0", .least = -100, .most = 100, .label = "Brightness",
      .help = "Percent of white to add before reducing.", .key = "DitherBrightness"};
 constexpr Parameter kDitherContrast =
     {.name = "contrast", .kind = kInteger, .unit = "%", .preset = "0", .least = -100, .most = 100, .label = "Contrast",
-     .help = "Contrast to add before reducing: -100 makes everything gray, 100 doubles distances from middle gray.",
+     .help = "Contrast to add before reducing: -100 makes everything gray, 100 doubles the distance from middle gray.",
      .key = "DitherContrast"};
 
 constexpr Parameter kReduce[] = {
     {.name = "colors", .kind = kInteger, .preset = "256", .least = 2, .most = 256, .label = "Colors",
-     .help = "The most colors of the result."},
+     .help = "Maximum number of colors."},
     {.name = "palette", .kind = kFile, .preset = "optimized", .most = 4096, .label = "Palette",
-     .help = "optimized: fitted to the picture; fixed: a standard palette; gray: even shades; file: that of the parameter file; or the name "
-             "of a color table."},
+     .help = "optimized: computed for the picture; fixed: a standard palette; gray: even shades; file: the color table given by file; or the name of a color table."},
     {.name = "dither", .kind = kChoice, .preset = "floyd-steinberg", .choices = kDitherWords, .label = "Dithering",
-     .help = "How missing colors are imitated.", .key = "FXColorDither", .keyWords = kDitherKeyWords},
+     .help = "How missing colors are approximated.", .key = "FXColorDither", .keyWords = kDitherKeyWords},
     kBidirectional,
     {.name = "file", .kind = kFile, .preset = "fmwpro.ccl", .most = 4096, .label = "Color table",
-     .help = "A color table (.ccl, .act, .gpl or .pal) for palette=file; one that is not found is looked for in the data folder.",
+     .help = "Color table (.ccl, .act, .gpl or .pal) for palette=file; also searched for in the data folder.",
      .key = "ColourTableFile"},
     kDitherBrightness,
     kDitherContrast,
@@ -52,9 +51,9 @@ constexpr Parameter kReduce[] = {
 
 constexpr Parameter kMono[] = {
     {.name = "threshold", .kind = kInteger, .unit = "levels", .preset = "0", .least = 0, .most = 255, .label = "White threshold",
-     .help = "Without dithering, the darkest brightness that becomes white; 0 finds the best one.", .key = "FXThreshold"},
+     .help = "Without dithering, the lowest brightness that becomes white; 0 finds the best value.", .key = "FXThreshold"},
     {.name = "dither", .kind = kChoice, .preset = "floyd-steinberg", .choices = kDitherWords, .label = "Dithering",
-     .help = "How gray is imitated.", .key = "FXMonoDither", .keyWords = kDitherKeyWords},
+     .help = "How gray is approximated.", .key = "FXMonoDither", .keyWords = kDitherKeyWords},
     kBidirectional,
     kDitherBrightness,
     kDitherContrast,
@@ -92,7 +91,7 @@ RecordedText LoadColorTable(const std::string& path, PaletteChoice& choice) {
   if (!platform::IsRegularFile(path) ||
       platform::ReadWholeFile(path, kMostColorTableBytes, contents) != platform::ReadResult::Done) {
     return TrRecorded(
-        "is neither optimized, fixed, gray or file nor a color table that can be read");
+        "is not optimized, fixed, gray, file or a readable color table");
   }
   choice.kind = PaletteChoice::Kind::Given;
   return ReadColorTable(contents, choice.given, choice.colors) == Status::Ok
@@ -110,7 +109,7 @@ ArgumentProblem CheckReduce(const Arguments& arguments) {
   if (problem.empty()) return {};
   if (palette == "file")
     return {"file",
-            TrRecorded("names no color table that can be read: %1", arguments.Text("file"))};
+            TrRecorded("names a color table that cannot be read: %1", arguments.Text("file"))};
   return {"palette", problem};
 }
 
@@ -149,7 +148,7 @@ constexpr Operation kOperations[] = {
      .family = Family::Effects,
      .label = "Reduce colors",
      .help =
-         "Brings a picture down to a palette of at most 256 colors, at 1, 4 or 8 bits per pixel.",
+         "Reduces a picture to a palette of at most 256 colors, at 1, 4 or 8 bits per pixel.",
      .example = "reduce 16 dither=stucki",
      .parameters = kReduce,
      .works = Works::Colors,
@@ -158,7 +157,7 @@ constexpr Operation kOperations[] = {
     {.name = "mono",
      .family = Family::Effects,
      .label = "Black and white",
-     .help = "Brings a picture down to black and white at 1 bit per pixel.",
+     .help = "Reduces a picture to black and white at 1 bit per pixel.",
      .example = "mono dither=atkinson",
      .parameters = kMono,
      .works = Works::Colors,

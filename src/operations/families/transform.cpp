@@ -39,14 +39,13 @@ constexpr Parameter kResize[] = {
      .preset = "fit",
      .choices = "fit|fill|stretch|pad",
      .label = "Mode",
-     .help = "fit keeps the proportions within the size, fill crops what is too much, stretch "
-             "ignores them, pad adds a background."},
+     .help = "fit: scale to fit within the size; fill: cover the size and crop the rest; stretch: ignore proportions; pad: fit and add a background."},
     {.name = "filter",
      .kind = kChoice,
      .preset = "bicubic",
      .choices = "nearest|box|triangle|bicubic|mitchell|lanczos3",
      .label = "Filter",
-     .help = "How pixels are computed from those around them.",
+     .help = "Resampling filter.",
      .key = "ResizeFilter",
      .keyWords = "bicubic|lanczos3|triangle|nearest"},
     {.name = "only",
@@ -54,18 +53,17 @@ constexpr Parameter kResize[] = {
      .preset = "",
      .choices = "shrink|grow",
      .label = "Only",
-     .help = "shrink leaves pictures alone that are smaller, grow those that are larger."},
+     .help = "shrink: never enlarge; grow: never reduce."},
     {.name = "linear",
      .kind = kFlag,
      .preset = "no",
      .label = "Linear light",
-     .help = "Computes with light instead of sRGB values: slower, and fine bright details keep "
-             "their brightness."},
+     .help = "Computes in linear light instead of sRGB values: slower, but fine bright details keep their brightness."},
     {.name = "background",
      .kind = kColor,
      .preset = "#ffffff",
      .label = "Background",
-     .help = "What pad fills the rest of the size with.",
+     .help = "Background color for mode=pad.",
      .key = "AlphaBackground"},
 };
 
@@ -156,7 +154,7 @@ constexpr Parameter kBackground = {.name = "background",
                                    .kind = kColor,
                                    .preset = "#ffffff",
                                    .label = "Background",
-                                   .help = "What is seen where the picture does not reach.",
+                                   .help = "Color of the areas the picture does not cover.",
                                    .key = "AlphaBackground"};
 constexpr Parameter kGrow = {
     .name = "mode",
@@ -164,16 +162,16 @@ constexpr Parameter kGrow = {
     .preset = "grow",
     .choices = "grow|keep",
     .label = "Mode",
-    .help = "grow makes room for the whole picture, keep leaves its size."};
+    .help = "grow: enlarge the canvas to hold the whole picture; keep: keep its size."};
 constexpr Parameter kSampling = {.name = "filter",
                                  .kind = kChoice,
                                  .preset = "bicubic",
                                  .choices = "bicubic|bilinear|nearest",
                                  .label = "Filter",
-                                 .help = "How pixels are computed from those around them."};
+                                 .help = "Resampling filter."};
 constexpr Parameter kRotate[] = {
     {.name = "angle", .kind = kAngle, .unit = "degrees", .least = -360, .most = 360, .label = "Angle",
-     .help = "Clockwise. Multiples of 90 change no pixel."},
+     .help = "Clockwise. Multiples of 90 are lossless."},
     kBackground, kGrow, kSampling,
 };
 
@@ -201,10 +199,10 @@ Status Straighten(PictureRecord& picture, const Arguments& arguments,
 
 constexpr Parameter kDeskew[] = {
     {.name = "most", .kind = kAngle, .unit = "degrees", .preset = "15", .least = 0.1, .most = 45, .label = "At most",
-     .help = "The largest angle to look for."},
+     .help = "The largest angle to correct."},
     kBackground,
     {.name = "mode", .kind = kChoice, .preset = "keep", .choices = "grow|keep", .label = "Mode",
-     .help = "grow makes room for the whole picture, keep leaves its size."},
+     .help = "grow: enlarge the canvas to hold the whole picture; keep: keep its size."},
     kSampling,
 };
 
@@ -218,9 +216,9 @@ Status Deskew(PictureRecord& picture, const Arguments& arguments, const Operatio
 
 constexpr Parameter kShear[] = {
     {.name = "across", .kind = kAngle, .unit = "degrees", .preset = "0", .least = -80, .most = 80, .label = "Across",
-     .help = "How far columns lean: positive values move the bottom to the right."},
+     .help = "Horizontal shear: positive values move the bottom to the right."},
     {.name = "down", .kind = kAngle, .unit = "degrees", .preset = "0", .least = -80, .most = 80, .label = "Down",
-     .help = "How far rows lean after that: positive values move the right side down."},
+     .help = "Vertical shear, applied after that: positive values move the right side down."},
     kBackground, kSampling,
 };
 
@@ -261,8 +259,7 @@ constexpr Parameter kPerspective[] = {
      .least = 0.0001,
      .most = 1e9,
      .label = "Size",
-     .help = "WxH, Wx or xH of the result, or one value for both edges. As long as the longer edge "
-             "between the points when it is left out."},
+     .help = "WxH, Wx or xH of the result, or one value for both edges (default: the longer edges between the points)."},
     kBackground,
     kSampling,
 };
@@ -290,8 +287,8 @@ Status Perspective(PictureRecord& picture, const Arguments& arguments,
 }
 
 constexpr Parameter kOffset[] = {
-    {.name = "x", .kind = kLength, .unit = "px", .preset = "50%", .label = "Right", .help = "How far to the right."},
-    {.name = "y", .kind = kLength, .unit = "px", .preset = "50%", .label = "Down", .help = "How far down."},
+    {.name = "x", .kind = kLength, .unit = "px", .preset = "50%", .label = "Right", .help = "Distance to the right."},
+    {.name = "y", .kind = kLength, .unit = "px", .preset = "50%", .label = "Down", .help = "Distance downward."},
 };
 
 Status Offset(PictureRecord& picture, const Arguments& arguments, const OperationContext&) {
@@ -350,7 +347,7 @@ constexpr Operation kOperations[] = {
     {.name = "upright",
      .family = Family::Transform,
      .label = "Upright",
-     .help = "Rotates a picture as its EXIF orientation says.",
+     .help = "Rotates a picture upright by its EXIF orientation.",
      .example = "upright",
      .parameters = {},
      .works = Works::Geometry,
@@ -359,7 +356,7 @@ constexpr Operation kOperations[] = {
     {.name = "straighten",
      .family = Family::Transform,
      .label = "Straighten",
-     .help = "Rotates a picture a little and crops it to the largest upright rectangle.",
+     .help = "Rotates a picture by a small angle and crops it to the largest upright rectangle.",
      .example = "straighten 2.5",
      .parameters = kStraighten,
      .works = Works::Geometry,
@@ -367,7 +364,7 @@ constexpr Operation kOperations[] = {
     {.name = "deskew",
      .family = Family::Transform,
      .label = "Deskew",
-     .help = "Finds the angle of a scanned page and sets it straight.",
+     .help = "Detects the angle of a scanned page and straightens it.",
      .example = "deskew 10",
      .parameters = kDeskew,
      .works = Works::Geometry,
@@ -384,7 +381,7 @@ constexpr Operation kOperations[] = {
      .family = Family::Transform,
      .label = "Perspective",
      .help =
-         "Makes a rectangle of the shape between four points, such as a sheet of paper in a photo.",
+         "Maps the area between four points to a rectangle, such as a sheet of paper in a photo.",
      .example = "perspective 10%,5% 90%,0 100%,100% 0,95%",
      .parameters = kPerspective,
      .works = Works::Geometry,
@@ -392,7 +389,7 @@ constexpr Operation kOperations[] = {
     {.name = "offset",
      .family = Family::Transform,
      .label = "Offset",
-     .help = "Moves a picture; what leaves on one side comes in on the other.",
+     .help = "Shifts a picture; what leaves on one side reappears on the other.",
      .example = "offset 50% 0",
      .parameters = kOffset,
      .works = Works::Geometry,
