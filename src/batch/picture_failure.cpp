@@ -40,7 +40,7 @@ std::string OpenHint(const std::string& fileName, Status status) {
   }
   const int32_t index = FindFormatByName(fileName);
   if (const std::string_view name = LooksLike(fileName, index); !name.empty()) {
-    return Tr("The contents look like %1.", Tr(name));
+    return Tr("It looks like %1.", Tr(name));
   }
   if (index == kNoFormat) return Tr("Unknown file extension.");
   if (!CanRead(FormatRow(index))) return Tr(WhyNot(FormatRow(index)));

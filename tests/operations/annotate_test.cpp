@@ -239,7 +239,7 @@ TEST_F(Watermarks, TextAndPictureAndTheirKeys) {
   const Rectangle ink = Changed(*text);
   EXPECT_NEAR(ink.width, 50, 4);
   EXPECT_EQ(MistakeIn("watermark hello picture=" + name_), "watermark: \"picture\" cannot be combined with text.");
-  EXPECT_THAT(MistakeIn("watermark picture=/no/such.png"), testing::StartsWith("watermark: \"picture\" names no picture that can be read"));
+  EXPECT_THAT(MistakeIn("watermark picture=/no/such.png"), testing::StartsWith("watermark: \"picture\" names a picture that cannot be read"));
   EXPECT_THAT(MistakeIn("text '%Q'"), testing::HasSubstr("unknown macro"));
 }
 

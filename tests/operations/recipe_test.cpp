@@ -44,7 +44,7 @@ TEST(Recipe, MistakesTellWhereAndWhatWasMeant) {
       {"blur sigma=0", 1, "blur", "sigma", "must be 0.1 to 1000."},
       {"blur nan", 1, "blur", "sigma", "must be a number."},
       {"blur 1e5", 1, "blur", "sigma", "must be a number."},
-      {"blur 1 2", 1, "blur", "2", "is more than the operation takes."},
+      {"blur 1 2", 1, "blur", "2", "is one value too many."},
       {"blur 1 sigma=2", 1, "blur", "sigma", "is given twice."},
       {"resize", 1, "resize", "size", "must be given."},
       {"resize 10x10 fitt", 1, "resize", "mode", "must be fit, fill, stretch or pad. Did you mean \"fit\"?"},

@@ -45,7 +45,7 @@ std::string ExtensionOfContents(std::span<const uint8_t> head) {
 
 std::string WhyUnknown(std::span<const uint8_t> head) {
   const std::string_view name = IdentifySignature(head).name;
-  return (name.empty() ? std::string() : Tr("The contents look like %1.", Tr(name)) + " ") +
+  return (name.empty() ? std::string() : Tr("It looks like %1.", Tr(name)) + " ") +
          Tr("Name the format with --from.");
 }
 
