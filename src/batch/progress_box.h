@@ -38,7 +38,7 @@ class ProgressBox {
 };
 
 // Opens the job's box, empties its list, and clears the job's error flag. False when the box cannot
-// be shown. A job without a box keeps its lines all the same.
+// be shown. A job without a box keeps its lines anyway.
 bool OpenProgressBox(BatchJob& job);
 // Adds `text` as a new line and sets the status line to "Processing file %d of %d" with index + 1
 // and count.

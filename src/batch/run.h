@@ -57,7 +57,7 @@ struct BatchFunction {
   bool autoOrient = false;                       // pictures are rotated upright by EXIF orientation
   bool keepMetadata = true;                      // EXIF, XMP and comments are copied
   ProfileRequest profile = {};                   // color profiles
-  // files that only lose their metadata are encoded all the same, with a quality that was asked for
+  // files that only lose their metadata are encoded anyway, with a quality that was asked for
   bool encodesAnew = false;
   // outputs get the modification times of their sources
   bool keepTimes = false;

@@ -91,7 +91,7 @@ class DirectoryWriter {
   void Long(uint32_t value) { Number(value, 4); }
   uint32_t Position() const { return base_ + static_cast<uint32_t>(bytes_.size()); }
 
-  // Writes a directory with its values; where it lies, 0 for an empty one.
+  // Writes a directory with its values; where it is, 0 for an empty one.
   uint32_t Write(ExifDirectory directory) {
     if (directory.empty()) return 0;
     std::stable_sort(directory.begin(), directory.end(),
@@ -188,7 +188,7 @@ ExifDirectories ParseExifBlock(std::span<const uint8_t> block) {
 
 std::vector<uint8_t> MakeExifBlock(const ExifDirectories& directories) {
   std::vector<uint8_t> subdirectories, block;
-  // The first directory stands in front: its size tells where the others begin.
+  // The first directory is in front: its size tells where the others begin.
   ExifDirectory first = directories.first;
   const bool hasExif = !directories.exif.empty() || !directories.interoperability.empty(),
              hasGps = !directories.gps.empty();

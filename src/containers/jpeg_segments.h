@@ -36,7 +36,7 @@ class JpegWalk {
   explicit JpegWalk(WalkedBytes file, uint64_t mostGarbage = 0);
   // The next segment; false at the end.
   bool Next(JpegPlace& segment);
-  // Where the walk stands, and why it ended: Ok at a scan; DamagedFile (2) at what is no segment;
+  // Where the walk is, and why it ended: Ok at a scan; DamagedFile (2) at what is no segment;
   // FileReadError (3) where the file ends.
   uint64_t Position() const { return next_; }
   Status Outcome() const { return outcome_; }

@@ -13,7 +13,7 @@ namespace fotomill {
 // exactly; blanks around a key and a section line do not count. The value is everything behind the
 // "=", blanks included. Lines end in LF or CR LF.
 //
-// Where a key stands more than once in its section, the first one counts.
+// If a key appears more than once in its section, the first one counts.
 
 // An "=" line of the section that was asked for. Views into the text.
 struct IniEntry {

@@ -72,7 +72,7 @@ FileOperation PlanFileOperation(FileOperationKind kind, const std::vector<std::s
 FileOperationResult CarryOut(const FileOperation& operation,
                              const FileOperationOptions& options = {},
                              const FileOperationProgress& progress = {});
-// Undoes an operation, last step first: files go back to where they were, copies that nobody has
+// Undoes an operation, last step first: files go back to where they were, copies that no one has
 // changed and outputs go to the trash.
 FileOperationResult Revert(const FileOperation& operation, const FileOperationOptions& options = {},
                            const FileOperationProgress& progress = {});

@@ -13,7 +13,7 @@
 
 namespace fotomill {
 
-// What a file was before a function replaced it, kept in the data folder until nobody can undo that
+// What a file was before a function replaced it, kept in the data folder until no one can undo that
 // any more.
 class PreviousFile {
  public:

@@ -8,7 +8,7 @@
 namespace fotomill {
 
 // The rectangle that a parameter of that kind means within a picture of size `whole`, in whole
-// pixels. One with a place may be outside; a size or a ratio is placed by gravity and lies within.
+// pixels. One with a place may be outside; a size or a ratio is placed by gravity and stays inside.
 Rectangle AreaOf(const Value& area, Size whole, const PictureMetadata& metadata,
                  Gravity gravity = Gravity::Center);
 

@@ -30,7 +30,7 @@ Status ApplySteps(PictureRecord& picture, std::span<const Step> steps,
 // Computes `area` of what the steps make of a picture, for previews. `part` gets that area as its
 // picture: the same bytes as in the whole result, outside of which nothing is. Steps from the last
 // one that is neither a point operation nor a filter of known reach on are computed for the area
-// alone. EmptyImage when the area lies outside the result.
+// alone. EmptyImage when the area is outside the result.
 Status ApplyStepsToArea(const PictureRecord& picture, std::span<const Step> steps,
                         const Rectangle& area, const EngineOptions& options, PictureRecord& part);
 

@@ -5,7 +5,7 @@
 
 namespace fotomill {
 
-// Where something lies within something larger: choices of a parameter, in the order of kGravities.
+// Where something is within something larger: choices of a parameter, in the order of kGravities.
 enum class Gravity : int32_t {
   Center,
   Top,

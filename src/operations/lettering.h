@@ -19,7 +19,7 @@ struct Lettering {
   double rotation = 0;            // degrees, clockwise
   double outline = 0;             // a line around letters
   AlphaColor outlineColor;
-  double shadow = 0;              // how far behind and below the letters their shadow lies
+  double shadow = 0;              // how far behind and below the letters their shadow is
   bool box = false;               // a box behind the text
   AlphaColor boxColor;
   double padding = 0;             // from the text to the edge of the box or the frame

@@ -14,7 +14,7 @@
 //   # a comment: the first character of a line is "#"
 //   upright                                  an operation
 //   crop 3:2 gravity=center; sharpen 0.6     ";" outside quotes ends a line too
-//   output large                             what stands before the first output is common to all
+//   output large                             what comes before the first output is common to all
 //   and done once
 //     resize 2048x2048
 //     save to=jpg quality=85 name="%F-large"

@@ -33,7 +33,7 @@ constexpr int32_t kPageDigits = 5;
 constexpr size_t kCellsAhead = 64;
 constexpr uint64_t kBytesAhead = uint64_t{64} << 20;
 
-// The path of the next page that nobody has. ErrorWritingFile if the numbers are used up,
+// The path of the next page that no one has. ErrorWritingFile if the numbers are used up,
 // ErrorCreatingFile if the system cannot tell.
 Status NextPageName(BatchJob& job, std::string& path) {
   platform::Existence existence;

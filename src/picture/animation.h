@@ -16,14 +16,14 @@ struct Canvas {
 // A canvas that is transparent all over. Statuses as NewPackedImage.
 Status NewCanvas(int32_t width, int32_t height, Canvas& canvas);
 
-// The frames of a file one after the other, each as it stands on the canvas after those before it.
+// The frames of a file one after the other, each as it is on the canvas after those before it.
 // A frame costs its own decoding, wherever in the file it is, and only one is held. Codecs derive
 // from this; the file stays open as long.
 class Animation {
  public:
   virtual ~Animation() = default;
 
-  // How long each frame stands, in milliseconds as the file has it, and so how many there are: at
+  // How long each frame is shown, in milliseconds as the file has it, and so how many there are: at
   // least one.
   const std::vector<int32_t>& Delays() const { return delays_; }
   // How often the frames are to be played, 0 for ever.
@@ -49,7 +49,7 @@ class Animation {
   size_t next_ = 0;
   Status failure_ = Status::Ok;  // of the last Next
 };
-using AnimationPointer = std::unique_ptr<Animation>;  // null where there is none
+using AnimationPointer = std::unique_ptr<Animation>;  // null if there is none
 
 // How long a frame is shown that asks for `delayMs`. One of 10 ms or less stands for 100 ms: old
 // programs wrote such delays knowing that no browser of their time would keep to them, and browsers

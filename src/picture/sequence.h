@@ -28,6 +28,6 @@ class SequenceWriter {
   // Completes the file and gives it its name, as the options say.
   virtual Status Finish() = 0;
 };
-using SequencePointer = std::unique_ptr<SequenceWriter>;  // null where there is none
+using SequencePointer = std::unique_ptr<SequenceWriter>;  // null if there is none
 
 }  // namespace fotomill

@@ -25,7 +25,7 @@ struct FileFacts {
 };
 
 // Facts of the file that `path` leads to, through links. Missing is a kind, not an error. What
-// cannot be asked (a folder on the way may not be searched) is Other: nobody may take it for free.
+// cannot be asked (a folder on the way may not be searched) is Other: no one may take it for free.
 FileFacts FactsOf(const std::string& path);
 bool FileExists(const std::string& path);  // anything of that name, a dangling link included
 bool IsRegularFile(const std::string& path);  // links are followed

@@ -28,7 +28,7 @@ class HeldFile {
   ~HeldFile() { Release(); }
 
   // Waits for the file's lock, then remembers the file as it is. A file that is not there, or that
-  // cannot be locked on its file system, is remembered all the same. False when another program did
+  // cannot be locked on its file system, is remembered anyway. False when another program did
   // not give up the lock, or when this one was asked to end; the reason is kept.
   [[nodiscard]] bool Hold(const std::string& path);
   void Release();

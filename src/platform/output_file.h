@@ -42,7 +42,7 @@ class OutputFile {
   // replaces another is always synced. After anything but Done there is no new file; Commit cannot
   // be tried again.
   [[nodiscard]] CommitResult Commit(Existing existing, bool sync = false);
-  void Discard();  // deletes what was written; the destination stays as it was
+  void Discard();  // deletes what was written; the destination stays unchanged
 
  private:
   bool CreateNamedSibling(unsigned mode);

@@ -18,9 +18,9 @@ std::vector<std::string> ProgramFor(const std::string& file);
 // messages. Before anything is opened.
 void FillStandardStreams();
 bool IsTerminal(int stream);  // 0 standard input, 1 output, 2 error
-// Whether nobody reads what is written to a stream any more: a pipe whose other end is closed.
+// Whether no one reads what is written to a stream any more: a pipe whose other end is closed.
 bool IsReaderGone(int stream);
-bool IsStored(int stream);    // goes to a regular file: nobody waits for what is written
+bool IsStored(int stream);    // goes to a regular file: no one waits for what is written
 // Waits until the standard input has something to read, or has ended. False when the program was
 // asked to end meanwhile.
 bool WaitForInput();
@@ -35,9 +35,9 @@ unsigned CoreCount();  // cores this process may use, at least 1
 
 // From here on Ctrl-C and the system's request to end are remembered instead of ending the program
 // at once, and `PendingExit` returns the exit status that belongs to them: 130 or 143, 0 while
-// nothing was asked. A second request ends the program at once; temporary files go all the same. A
+// nothing was asked. A second request ends the program at once; temporary files go anyway. A
 // request that was ignored when the program started (nohup) stays ignored. Writing to a pipe that
-// nobody reads any more fails from here on, instead of ending the program.
+// no one reads any more fails from here on, instead of ending the program.
 void CatchTermination();
 int PendingExit();  // 130 or 143; 0 while nothing was asked
 

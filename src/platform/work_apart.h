@@ -46,7 +46,7 @@ struct ApartTask {
 
 // The first call of every program that has work done apart, before it begins a thread. In the
 // program that the user started it does nothing, and returns nothing; in a process apart, which is
-// that program started again, it does what it is asked for until nobody asks any more, and returns
+// that program started again, it does what it is asked for until no one asks any more, and returns
 // the exit status.
 std::optional<int> ServeApart(int count, const char* const* arguments,
                               std::span<const ApartTask> tasks);

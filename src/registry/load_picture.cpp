@@ -11,7 +11,7 @@ namespace fotomill {
 
 namespace {
 
-// The row of a format by its extension as it stands in the table, not as names match; else the
+// The row of a format by its extension as it is in the table, not as names match; else the
 // plug-in's, which is bound.
 int32_t RowOf(std::string_view extension) {
   for (int32_t i = 0; i < kSpareRow; ++i) {

@@ -27,7 +27,7 @@ inline constexpr size_t kSignatureBytes = 512 + 32;
 FileKind IdentifySignature(std::span<const uint8_t> head);
 // The same for a file; nothing fits when it cannot be opened.
 FileKind IdentifyFile(const std::string& fileName);
-// What a file is whose name selects row `formatIndex` (kNoFormat: none) and lies; nothing when the
+// What a file is whose name selects row `formatIndex` (kNoFormat: none) is wrong; nothing when the
 // contents are what the name says, or tell nothing.
 FileKind KindBehindName(const std::string& fileName, int32_t formatIndex);
 

@@ -68,7 +68,7 @@ enum class SaveResult {
   Unchanged,   // there was nothing to write
   NoFolder,    // the system has no place for it
   Unreadable,  // what is there cannot be read and is left alone
-  Failed,      // not written; the old file stands
+  Failed,      // not written; the old file stays
 };
 std::string_view SaveMessage(SaveResult result);  // a whole sentence in English, empty for success
 

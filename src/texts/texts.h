@@ -82,7 +82,7 @@ struct Language {
 };
 
 // Chooses the language of this run: `code` if it is not empty, else what LANGUAGE, LC_ALL,
-// LC_MESSAGES and LANG ask for, as gettext reads them. English where there is no catalog; false if
+// LC_MESSAGES and LANG ask for, as gettext reads them. English if there is no catalog; false if
 // that is not what `code` asks for. Before other threads run.
 bool StartTexts(const std::string& code);
 // The language in use, "en" for the source texts.

@@ -63,7 +63,7 @@ std::string Settle(BatchJob& job, const std::set<std::string>& there, const std:
   return (destination.replace ? destination.recycle ? "!~" : "!" : "") + destination.path;
 }
 
-// A name that nobody can tell about is neither free nor taken, and no search goes on forever.
+// A name that no one can tell about is neither free nor taken, and no search goes on forever.
 TEST(DestinationName, SearchesForNamesEnd) {
   BatchJob job;
   EXPECT_EQ(Settle(job, {}, "unknown.bmp"), "Error creating file.");

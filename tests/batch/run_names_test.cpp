@@ -17,7 +17,7 @@ TEST(RunNames, OnlyFilesThatNobodyElseConcernsGoAhead) {
   const struct {
     const char* name;
     Plan plan;
-    // nobody else is concerned; another's output may come to lie on the source
+    // no one else is concerned; another's output may come to lie on the source
     bool alone, overwritten;
   } rows[] = {
       {"names apart", {{"/x/a.bmp", "/out/a.pcx"}, {"/x/b.bmp", "/out/b.pcx"}}, true, false},

@@ -230,7 +230,7 @@ TEST(Thumbnail, DatabaseModesKeepWhatTheyMade) {
   EXPECT_EQ(LoadThumbnail(request)->status, Status::FileOpenError);
 }
 
-// A stand-in is the file's own thumbnail, upright as the picture is; where there is none, nothing
+// A stand-in is the file's own thumbnail, upright as the picture is; if there is none, nothing
 // is decoded.
 TEST(Thumbnail, StandInsComeFromTheExif) {
   const test::TemporaryFolder folder;

@@ -210,7 +210,7 @@ TEST(Xbm, ReadsLongTextsInOnePass) {
 }
 
 // Where the width is no multiple of 8, others have the padding of a row behind it, and we in front
-// of it, which is on purpose: what they read of ours lies to the right by as many pixels, what we
+// of it, which is on purpose: what they read of ours is to the right by as many pixels, what we
 // read of theirs to the left.
 TEST(Xbm, AgreesWithNetpbmAtWholeBytes) {
   if (!HasProgram("xbmtopbm") || !HasProgram("pbmtoxbm")) GTEST_SKIP() << "netpbm is not installed";

@@ -67,7 +67,7 @@ class HeldFileTest : public testing::TestWithParam<ReplaceWay> {
 };
 INSTANTIATE_TEST_SUITE_P(Ways, HeldFileTest, testing::Values(ReplaceWay::Exchange, ReplaceWay::Link, ReplaceWay::Look));
 
-// What another program does to the file, and what lies there afterwards.
+// What another program does to the file, and what is there afterwards.
 void WriteInPlace(const std::string& path) { WriteText(path, "theirs, in place"); }
 void SaveBeside(const std::string& path) {
   WriteText(path + ".new", "theirs");

@@ -33,7 +33,7 @@ TEST(KeyTable, RowsAreSound) {
 
 TEST(KeyTable, StoredTextsStayWithinTheirLimit) {
   const KeyRow& crop = KeyOf(KeyNumber::PrefixCrop);
-  const SettingPrefix duplicate = settings.PrefixDuplicate;  // lies behind PrefixCrop
+  const SettingPrefix duplicate = settings.PrefixDuplicate;  // comes after PrefixCrop
   StoreText(crop, std::string(100, 'x'));
   EXPECT_EQ(TextIn(crop), std::string(32, 'x'));
   EXPECT_EQ(settings.PrefixDuplicate.view(), duplicate.view());

@@ -16,7 +16,7 @@ struct CommandResult {
   int status = -1;
   std::string out, err;
 
-  // The standard error, in which each text stands on a line of its own.
+  // The standard error, in which each text is on a line of its own.
   bool Says(const std::string& line) const {
     return ("\n" + err).find("\n" + line + "\n") != std::string::npos;
   }

@@ -39,7 +39,7 @@ class BlockBuilder {
   uint32_t Directory(const std::vector<Entry>& entries, uint32_t next = 0);
   uint32_t Bytes(const std::vector<uint8_t>& bytes);
   void Patch32(uint32_t offset, uint32_t number);
-  // Where the link of the directory at `offset` stands.
+  // Where the link of the directory at `offset` is.
   uint32_t LinkOf(uint32_t offset) const;
   std::vector<uint8_t> block;
 

@@ -66,7 +66,7 @@ struct DatabaseKey {
 std::string VolumeKeyFor(const std::string& path);
 
 // Whether compaction tests a picture for existence: not on network, optical and removable drives,
-// nor where another volume than the record's lies now.
+// nor where another volume than the record's is mounted now.
 bool PurgesMissing(const DatabaseKey& key);
 
 // The database of a folder; of an empty one the global database, whose path is empty where there is
@@ -133,7 +133,7 @@ class ThumbnailDatabase {
     Stopped,  // asked to stop
   };
   // Copies what is not deleted (and with `purgeMissing`, whose picture is there) into "PATH.BAK",
-  // which then takes the database's place in one step. Otherwise the database stays as it was.
+  // which then takes the database's place in one step. Otherwise the database stays unchanged.
   Compacted CompactThumbnailDatabase(bool purgeMissing, ProgressSink* progress = nullptr,
                                      const StopToken& stop = {});
 

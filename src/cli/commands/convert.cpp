@@ -61,7 +61,7 @@ struct ConvertOptions {
 constexpr size_t kLongestPrefix = SettingPrefix::Capacity();
 constexpr uint64_t kMostProfileBytes = 8 << 20;
 
-// The option decides if given, else the settings. If the settings say ask and nobody can answer,
+// The option decides if given, else the settings. If the settings say ask and no one can answer,
 // both files are kept.
 void SetOverwritePolicy(const ConvertOptions& options, const CommandContext& context,
                         BatchJob& job) {

@@ -147,7 +147,7 @@ class Search {
     candidate.record.height = picture->height;
   }
 
-  // Pictures whose size nobody else has are equal to none.
+  // Pictures whose size no one else has are equal to none.
   void FindLonely() {
     std::map<std::pair<int32_t, int32_t>, size_t> sizes;
     const auto sizeOf = [](const Candidate& candidate) {

@@ -59,7 +59,7 @@ std::vector<Word> SplitWords(const std::string& list) {
   return words;
 }
 
-// What stands behind an option or in place of a name, by its placeholder.
+// What comes behind an option or in place of a name, by its placeholder.
 Choice ChoiceOf(const std::string& placeholder) {
   if (placeholder == "KEY=VALUE") return {Choice::Words, KeyWords("="), true};
   if (placeholder.starts_with("KEY")) return {Choice::Words, KeyWords("")};

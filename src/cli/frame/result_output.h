@@ -44,7 +44,7 @@ class ResultOutput {
   void ShowAsStream(const std::string& path) { streams_.push_back(path); }
   // The name of a file in results.
   std::string_view NameOf(std::string_view name) const;
-  // The command changes files: it finishes its work although nobody reads the results any more.
+  // The command changes files: it finishes its work although no one reads the results any more.
   void KeepGoing() { keepsGoing_ = true; }
 
   // One result line, without line end, already escaped. Not for JSON.

@@ -41,7 +41,7 @@ class BackgroundTask {
   std::shared_ptr<State> state_;
 };
 
-// Work that nobody waits for, since it may hang: `work` has to hold, or to ask for, all that it
+// Work that no one waits for, since it may hang: `work` has to hold, or to ask for, all that it
 // uses. False when no thread can be had.
 bool RunLoose(std::function<void()> work);
 

@@ -8,11 +8,11 @@
 namespace fotomill {
 
 // For its lifetime, a task works with a file: where that is on a network folder or a disc, which
-// may hang for minutes, the task keeps no core of the pool busy. Asking where it lies may hang as
+// may hang for minutes, the task keeps no core of the pool busy. Asking where it is may hang as
 // well, and keeps none busy either.
 class FolderScope {
  public:
-  explicit FolderScope(const std::string& path);  // where `path` lies decides
+  explicit FolderScope(const std::string& path);  // the place of `path` decides
 
  private:
   std::optional<CoreRelease> release_;

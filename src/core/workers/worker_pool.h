@@ -90,7 +90,7 @@ class WorkerPool {
 
 // Lets threads of the pool that have a core and nothing else to do help with work in small steps,
 // while the calling thread does the same by itself. They begin and leave at any time: where the
-// pool is busy with tasks, nobody comes.
+// pool is busy with tasks, no one comes.
 class Helpers {
  public:
   // `step` does a piece of the work, on up to `most` threads at once; false if there is none left

@@ -6,8 +6,8 @@
 
 namespace fotomill {
 
-// The BMP family: Windows and OS/2 bitmaps. How a file lies on disk, and what is peculiar to this
-// codec, stands in bmp.cpp.
+// The BMP family: Windows and OS/2 bitmaps. The file layout, and what is peculiar to this
+// codec, is described in bmp.cpp.
 
 // Fills the facts of `picture`: size, depth, palette, type name, kHasAlpha for files deeper than 24
 // bits. Ok, FileOpenError; DamagedFile for a short header, another signature, or a size or depth

@@ -56,14 +56,14 @@ const WordTable& ModeTable() {
   return table;
 }
 
-// The first change in the row above that lies right of `a0` and turns to the color opposite to
+// The first change in the row above that is right of `a0` and turns to the color opposite to
 // `black`, the color at `a0`: changes with an even place turn to black. `place` begins where the
 // search for the change before ended. The row starts on an imaginary white pixel left of it, so
 // that a change at column 0 counts while a0 is -1.
 size_t FindB1(const std::vector<int32_t>& above, size_t place, int32_t a0, bool black) {
   place = place > 1 ? place - 2 : 0;
   if ((place % 2 != 0) != black) ++place;
-  while (above[place] <= a0) place += 2;  // ends at the closing widths, for a0 lies before them
+  while (above[place] <= a0) place += 2;  // ends at the closing widths, for a0 is before them
   return place;
 }
 

@@ -41,7 +41,7 @@ Status ReadDirectory(std::span<const uint8_t> head, std::vector<uint32_t>& pages
   return pages.empty() ? Status::NoImages : Status::Ok;
 }
 
-// Where a page of the file lies. NoImages when there is no such page, FileReadError when it lies
+// Where a page of the file is. NoImages when there is no such page, FileReadError when it is
 // behind the end.
 Status FindPage(const platform::FileView& file, int32_t page, PictureRecord& picture,
                 PcxPlace& place) {

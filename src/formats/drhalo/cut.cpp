@@ -5,7 +5,7 @@
 //        4    2  reserved
 //        6       rows from the top, each with the bytes of its code before it, 2 bytes
 //
-// A code is made of 128 + count and a value for a run, of count and so many bytes as they are, and
+// A code is made of 128 + count and a value for a run, of count and that many literal bytes, and
 // ends with 0. halo_palette.h has the palette.
 //
 // The reader fills what a row's code leaves open with 0, and drops what would go beyond it. Without

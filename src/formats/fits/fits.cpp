@@ -10,7 +10,7 @@
 //        of |BITPIX| bits .    .  zeros up to a multiple of 2880
 //
 // Reads a card as its keyword up to the first blank or "=", then its value behind all blanks and
-// "="; a repeated keyword counts as it stands last. Of more than two axes the first plane is read.
+// "="; a repeated keyword counts with its last value. Of more than two axes the first plane is read.
 // The picture shows the first bytes of each row as they are in the file, one byte a pixel, through
 // a gray palette: values wider than a byte show as their single bytes, and BSCALE and BZERO change
 // nothing.

@@ -1,4 +1,4 @@
-// FlashPix pictures (FPX). How a file is laid out is told in fpx_file.cpp.
+// FlashPix pictures (FPX). The file layout is described in fpx_file.cpp.
 //
 // The picture is the largest size of the first object; a smaller one that is enough serves as a
 // thumbnail. Grays become 8 bits, PhotoYCC and RGB 24. Colors that were multiplied with an opacity

@@ -10,7 +10,7 @@
 
 namespace fotomill {
 
-// What of a FlashPix file describes its pictures. The layout is told in fpx_file.cpp.
+// What of a FlashPix file describes its pictures. The layout is described in fpx_file.cpp.
 
 enum class FpxColors : uint8_t { Gray = 1, PhotoYcc = 2, Rgb = 3 };
 

@@ -129,7 +129,7 @@ void ReadAtariColors(ByteReader& bytes, size_t count, Palette& palette) {
   }
 }
 
-// Reads what stands behind the first 16 bytes of the header. UnsupportedFormat.
+// Reads what comes behind the first 16 bytes of the header. UnsupportedFormat.
 Status ParseExtension(ByteReader& bytes, GemHeader& header, Palette& palette) {
   const size_t count = header.planes <= 8 ? size_t{1} << header.planes : 0;
   if (bytes.Match("XIMG")) {

@@ -37,7 +37,7 @@ struct GifScreen {
   GifPalette palette;
 };
 
-// One frame: where it lies in the screen, and how its pixels are coded.
+// One frame: where it is in the screen, and how its pixels are coded.
 struct GifFrame {
   int32_t left = 0, top = 0, width = 0, height = 0;
   bool interlaced = false;
@@ -61,7 +61,7 @@ struct GifFrame {
   }
 };
 
-// What lies between the frames.
+// What is between the frames.
 struct GifRemarks {
   std::vector<uint8_t> comment;
   bool loops = false;

@@ -25,7 +25,7 @@ class GifDrawing {
   platform::MemoryBlock beneath_;  // what was there before it, if it wants that back
 };
 
-// The number of frames in a file of which the reader stands behind the head of the first one.
+// The number of frames in a file of which the reader is behind the head of the first one.
 // Counted as far as the file is whole.
 int32_t CountGifFrames(ByteReader bytes, GifScreen screen);
 

@@ -13,7 +13,7 @@ namespace fotomill {
 // sub-blocks of up to 255 bytes that end in an empty one. The first byte is the number of bits of a
 // pixel, from 2 to 8.
 
-// Decodes pixels.size() indices from `bytes`, which stands at the first byte. Ok as soon as all
+// Decodes pixels.size() indices from `bytes`, which is at the first byte. Ok as soon as all
 // pixels are there, whether or not an end code follows; the reader is then left somewhere in the
 // data. DamagedFile for a code that cannot be or a pixel size outside 1 to 8, FileReadError when
 // the data end too early. `done`, which may be null: how many pixels were decoded in any case.

@@ -151,7 +151,7 @@ class GifSequence final : public SequenceWriter {
                                ? Rectangle{0, 0, screen_.image.Width(), screen_.image.Height()}
                                : ChangedArea(screen_, frame.canvas);
     const int32_t used = frame.colors.Count();
-    // pixels that stay the same need no color where there is an entry left for them
+    // pixels that stay the same need no color if there is an entry left for them
     const bool skips = !first_ && used < kMostColors;
     const bool transparent = frame.transparent || skips;
     Palette palette{};

@@ -119,7 +119,7 @@ bool IsKnown(HdpColors colors, HdpDepth depth) {
 struct HdpEntry {
   uint16_t tag = 0, type = 0;
   uint32_t count = 0, value = 0;
-  uint64_t place = 0;  // where the value itself lies when it is short
+  uint64_t place = 0;  // where the value itself is when it is short
 };
 
 HdpEntry TakeEntry(ByteReader& bytes) {
@@ -159,7 +159,7 @@ struct Extent {
   uint32_t offset = 0, size = 0;
 };
 
-// What lies there, as far as the file goes: some writers give wrong sizes, and a decoder says
+// What is there, as far as the file goes: some writers give wrong sizes, and a decoder says
 // itself what is missing.
 std::span<const uint8_t> Part(std::span<const uint8_t> file, const Extent& extent) {
   if (extent.offset == 0 || extent.offset >= file.size()) return {};

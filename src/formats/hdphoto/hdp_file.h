@@ -67,7 +67,7 @@ struct HdpPage {
   uint32_t turn = 0;
   float dpiX = 0, dpiY = 0;
   std::span<const uint8_t> icc, xmp, description;
-  uint64_t directory = 0;  // where the page's own directory lies, which may lead to those of EXIF
+  uint64_t directory = 0;  // where the page's own directory is, which may lead to those of EXIF
 };
 
 // The orientation of EXIF, 1 to 8, that a turn means, and back.

@@ -1,7 +1,7 @@
 // Windows animated cursors (ANI), RIFF of the form "ACON", little-endian. Its chunks:
 //
 //   anih   36 bytes, below
-//   rate   4 bytes a step: how long it stands, in sixtieths of a second; optional
+//   rate   4 bytes a step: how long it is shown, in sixtieths of a second; optional
 //   seq    4 bytes a step: the number of its picture; optional, else the pictures in their order
 //   LIST   of type "fram": a chunk "icon" for each picture, a whole cursor or icon file
 //   LIST   of type "INFO": title and author; not used
@@ -11,7 +11,7 @@
 //        4    4  number of pictures
 //        8    4  number of steps
 //       12   16  width, height, bits per pixel and planes of pictures without a header
-//       28    4  how long a step stands, in sixtieths of a second, for files without "rate"
+//       28    4  how long a step is shown, in sixtieths of a second, for files without "rate"
 //       32    4  bit 0: the pictures are icon or cursor files; bit 1: there is a "seq"
 //
 // The reader believes the chunks rather than the numbers of anih, which may be wrong or missing. An

@@ -23,7 +23,7 @@ Status IcoWrite(PictureRecord& picture, const WriteOptions& options);
 Status IcoSequenceBegin(const std::string& path, const SequenceFacts& facts,
                         const WriteOptions& options, SequencePointer& sequence);
 
-// The same for a file that stands inside another one: facts, pixels, and a cursor of one bitmap
+// The same for a file inside another one: facts, pixels, and a cursor of one bitmap
 // with its mask, which a picture of at most 256 x 256 pixels becomes. `picture` keeps its file's
 // name and size.
 Status DescribeIcon(std::span<const uint8_t> file, const ReadRequest& request,

@@ -10,7 +10,7 @@
 // ICC profile, comment and resolution travel with the picture; its orientation is not applied here.
 //
 // Broken data: a file that ends before its last pixel fails (status 3). A fault inside the data
-// that the decoder can pass over is told in the record's `warning`, and the picture is shown with
+// that the decoder can pass over is noted in the record's `warning`, and the picture is shown with
 // it; a missing end marker is no fault.
 //
 // The writer makes baseline or progressive files (WriteJpegProgressive) of quality JpegCompression

@@ -14,7 +14,7 @@
 //        black
 //
 // A row is packed by PackBits: control byte n below 128, then n + 1 bytes as they are; or n above
-// 128, then one byte that stands 257 - n times. Every byte is inverted on its way, since entry 1 of
+// 128, then one byte that is repeated 257 - n times. Every byte is inverted, since entry 1 of
 // the palette is white.
 //
 // Reads files without a MacBinary header, and files of rows alone, known by a first byte that is
@@ -102,7 +102,7 @@ Status UnpackRow(ByteReader& bytes, std::span<uint8_t> row) {
   return Status::Ok;
 }
 
-// Inverts and packs one row: equal neighbours as runs, whatever lies between them as it is.
+// Inverts and packs one row: equal neighbors as runs, everything else as it is.
 void PackRow(ByteWriter& out, const MacRow& row) {
   size_t literals = 0;  // bytes before `i` that no run has taken
   const auto flushLiterals = [&](size_t end) {
@@ -127,7 +127,7 @@ void PackRow(ByteWriter& out, const MacRow& row) {
   flushLiterals(row.size());
 }
 
-// Row y of the page on which the picture lies: white beside and below it, cut at the page's edges.
+// Row y of the page on which the picture is: white beside and below it, cut at the page's edges.
 MacRow PageRow(const PackedImage& image, int32_t y) {
   MacRow page;
   page.fill(0xFF);

@@ -25,7 +25,7 @@
 //     whole picture, 1 a thumbnail), then in that order blocks 9 with bitmaps, channels (2 each)
 //     and blocks 5, or blocks 18 of JPEG
 //
-// A run-length token is a count and so many bytes as they are, or from 129 on one byte that is
+// A run-length token is a count and that many literal bytes, or from 129 on one byte that is
 // repeated count - 128 times. Source: Jasc Software, "Paint Shop Pro (PSP) File Format
 // Specification", versions 3.0 to 6.0 (1998 to 2003).
 #include "formats/paintshop/psp_file.h"

@@ -10,7 +10,7 @@
 
 namespace fotomill {
 
-// What a Paint Shop Pro image holds, as views into the file. The layout is told in psp_file.cpp.
+// What a Paint Shop Pro image holds, as views into the file. See psp_file.cpp for the layout.
 
 enum class PspCompression : uint16_t { None = 0, RunLengths = 1, Lz77 = 2, Jpeg = 3 };
 enum class PspBitmap : uint16_t { Image = 0, Transparency = 1 };

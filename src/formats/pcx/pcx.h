@@ -6,7 +6,7 @@
 
 namespace fotomill {
 
-// PC Paintbrush. How a file lies on disk, and what is peculiar to this codec, stands in pcx.cpp.
+// PC Paintbrush. The file layout, and what is peculiar to this codec, is described in pcx.cpp.
 
 // Fills the facts of `picture`: size, depth, palette. Ok, FileOpenError; DamagedFile for a short
 // header, another signature, an unknown arrangement of planes, or a size that leaves nothing to

@@ -9,7 +9,7 @@
 
 namespace fotomill {
 
-// Where a PCX picture lies in a file: all of it, or a page among others. Within the file, `begin`
+// Where a PCX picture is in a file: all of it, or a page among others. Within the file, `begin`
 // not behind `end`.
 struct PcxPlace {
   uint64_t begin = 0, end = 0;

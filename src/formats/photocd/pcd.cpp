@@ -1,9 +1,9 @@
-// Photo CD pictures (PCD). How a file is laid out is told in pcd_file.cpp.
+// Photo CD pictures (PCD). The file layout is described in pcd_file.cpp.
 //
 // One file holds one picture in up to five sizes. The first three are stored plainly, the larger
 // ones as what they differ by from the size before, doubled. Which size is taken is up to
 // PhotoCDResolution, and to the thumbnail asked for. A picture that was taken upright is turned.
-// The pictures of an overview are pages. A size of 6144 x 4096, which lies in files of its own, is
+// The pictures of an overview are pages. A size of 6144 x 4096, which is in files of its own, is
 // not read.
 #include "formats/photocd/pcd.h"
 

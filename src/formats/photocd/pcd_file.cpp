@@ -26,7 +26,7 @@
 //     n+14  the deltas
 //
 // An overview has pictures of 192 x 128 one after the other from sector 5 on. How deltas are coded
-// is told in pcd_deltas.cpp.
+// is described in pcd_deltas.cpp.
 //
 // The maker published nothing, and what is known comes from those who looked at files. So what a
 // header says about its sizes is not relied on: a size is there when its data are.

@@ -8,7 +8,7 @@
 
 namespace fotomill {
 
-// Where the parts of a Photo CD file are. The layout is told in pcd_file.cpp.
+// Where the parts of a Photo CD file are. The layout is described in pcd_file.cpp.
 
 inline constexpr uint64_t kPcdSector = 2048;
 inline constexpr uint64_t kPcdHeader = 1 * kPcdSector;    // of the image's facts

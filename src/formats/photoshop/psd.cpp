@@ -203,7 +203,7 @@ Status ReadMerged(const PsdFile& document, const PictureRecord& picture, PackedI
   return Status::Ok;
 }
 
-// Copies the part of a layer's row that lies on the canvas.
+// Copies the part of a layer's row that is on the canvas.
 void PlaceRow(std::span<const uint8_t> row, int32_t left, int32_t canvasWidth,
               std::span<uint8_t> target) {
   const auto bytes = static_cast<int64_t>(target.size()) / canvasWidth;

@@ -10,7 +10,7 @@
 
 namespace fotomill {
 
-// What a Photoshop document holds, as views into the file. The layout of the file is told in
+// What a Photoshop document holds, as views into the file. The file layout is described in
 // psd_file.cpp.
 
 // Color modes of a Photoshop file, by the numbers of its header.

@@ -23,7 +23,7 @@
 //        at most 250, else in 2
 //
 // 8200 holds a compressed picture of QuickTime: bytes (4), version (2), matrix (36), matte size
-// (4), matte (8), mode (2), source (8), accuracy (4), mask size (4), where there is a matte its
+// (4), matte (8), mode (2), source (8), accuracy (4), mask size (4), if there is a matte its
 // description and data, the mask, then the description of the picture: its bytes (4), type (4),
 // ..., width at 32, height at 34, bytes of data at 44, and the data.
 //

@@ -9,7 +9,7 @@
 
 namespace fotomill {
 
-// What of a Macintosh picture can be shown, as views into the file. The layout is told in
+// What of a Macintosh picture can be shown, as views into the file. The layout is described in
 // pict_file.cpp.
 
 struct PictPixels {

@@ -12,7 +12,7 @@ namespace fotomill {
 struct PegasusStream {
   std::span<const uint8_t> data = {};
   bool bare = false;  // the file is the stream, without a bitmap's head
-  // the codes of the "PIC" segment: 32 means the tables of T.81, K.1. 0 where there is none.
+  // the codes of the "PIC" segment: 32 means the tables of T.81, K.1. 0 if there is none.
   uint8_t lumaCode = 0, chromaCode = 0;
   // an abbreviated stream with two quantizer tables; empty without codes
   std::array<uint8_t, 2 + 2 * (5 + 64) + 2> tables = {};

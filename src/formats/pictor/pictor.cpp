@@ -15,7 +15,7 @@
 //        .       data: the rows of the first plane from the bottom up, then those of the next
 //
 // Each row of a plane is whole bytes, pixels from the highest bits down; the first plane holds the
-// lowest bit of all pixels. Blocks are told in pictor_runs.cpp.
+// lowest bit of all pixels. Blocks are described in pictor_runs.cpp.
 //
 // Read are one plane of 1, 2, 4 or 8 bits and up to four of 1 bit. Text screens and pictures of 24
 // bits are not. Written are pictures of up to 8 bits with a VGA palette, so colors have 6 bits:

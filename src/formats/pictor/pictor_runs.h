@@ -7,7 +7,7 @@
 
 namespace fotomill {
 
-// The data of a Pictor picture: blocks of run-length code, or plain bytes. The code is told in
+// The data of a Pictor picture: blocks of run-length code, or plain bytes. The code is described in
 // pictor_runs.cpp.
 class PictorData {
  public:

@@ -7,7 +7,7 @@
 //
 // What the reader makes of it: palettes and grays of 1, 2, 4 and 8 bits without transparency keep
 // their depth (grays with a gray palette); everything else becomes 24 bits, with an alpha plane
-// where there is an alpha channel or a transparent color. 16-bit samples are rounded to 8. Gamma is
+// if there is an alpha channel or a transparent color. 16-bit samples are rounded to 8. Gamma is
 // told, not applied. Of an animation (acTL) the default picture is shown. EXIF, XMP, ICC profile
 // and resolution travel with the picture.
 //
@@ -204,7 +204,7 @@ void TakeMetadata(const PngReader& reader, PictureRecord& picture) {
 }
 
 // The number of frames that an animation's acTL chunk names, as far as the file has them, 1 for a
-// still picture. The chunk stands before the pixels, and each frame has an fcTL chunk.
+// still picture. The chunk comes before the pixels, and each frame has an fcTL chunk.
 int32_t FrameCount(std::span<const uint8_t> file) {
   PngChunks chunks(file);
   PngChunk chunk;

@@ -23,7 +23,7 @@ Status PngSequenceBegin(const std::string& path, const SequenceFacts& facts,
                         const WriteOptions& options, SequencePointer& sequence);
 Status PngDetails(PictureRecord& picture);
 
-// The same for a file that lies in memory, as containers hold them. Statuses as above.
+// The same for a file in memory, as containers hold them. Statuses as above.
 Status DescribePng(std::span<const uint8_t> file, const ReadOptions& options,
                    PictureRecord& picture);
 // A PNG file in memory: facts and pixels at once; `partial` as in a read request.

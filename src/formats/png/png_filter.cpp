@@ -87,7 +87,7 @@ inline __m128i LoadPixel(const uint8_t* source) {
   return _mm_cvtepu8_epi16(_mm_cvtsi32_si128(bytes));
 }
 
-// Pixels of 3 or 4 bytes, one 16-bit lane for each byte. A pixel is stored with what lies behind
+// Pixels of 3 or 4 bytes, one 16-bit lane for each byte. A pixel is stored with what is behind
 // it, which is loaded before.
 template <size_t kBytes>
 void UndoPaeth(uint8_t* row, const uint8_t* above, size_t size) {

@@ -7,7 +7,7 @@
 namespace fotomill {
 
 // The run-length code of SGI rows. Each sample is one byte, or two bytes with the high one first. A
-// sample whose low seven bits are a count stands before that many samples as they are (0x80 set),
+// sample whose low seven bits are a count comes before that many samples as they are (0x80 set),
 // or before one sample that is repeated; a count of 0 ends the row.
 
 // A sample of two bytes as one of 8 bits, rounded.

@@ -13,7 +13,7 @@
 //
 // Pixels of 24 bits are blue, green, red, in files of type RGB red, green, blue; of 32 bits there
 // is an unused byte in front. Without a map, a bit that is set is black, and 8 bits are gray. In
-// byte-encoded pixels 128 stands before a count n and a value that comes n + 1 times; a count of 0
+// byte-encoded pixels 128 comes before a count n and a value that comes n + 1 times; a count of 0
 // has no value and means 128 itself. Runs go on from row to row.
 //
 // The writer makes standard files without runs, which every reader takes: black and white in 1 bit,

@@ -19,7 +19,7 @@
 // times (n from 128), or n + 1 pixels as they stand.
 //
 // The reader takes packets that go on in the next row. Attribute bits count as alpha when the
-// descriptor has them and the extension area, where there is one, does not call them useless; an
+// descriptor has them and the extension area, if there is one, does not call them useless; an
 // alpha plane without any opacity is taken for unset and dropped, as many programs leave these bits
 // zero.
 //

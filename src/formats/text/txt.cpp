@@ -4,7 +4,7 @@
 // margin around. Such pictures are black on white, with InvertTextFiles white on black. Long lines
 // are broken, and long texts cut, as text_lines.h says.
 //
-// Writing stands a character for each pixel across and two down, since characters are about twice
+// Writing sets a character for each pixel across and two down, since characters are about twice
 // as high as wide: a column has the average brightness of its two pixels. TextCharacterLevels has
 // the characters from those with the least ink to those with the most, in UTF-8; or, when it is no
 // UTF-8, in Windows-1252. The byte 0xFF, a blank in the character sets of DOS, stands for a blank.

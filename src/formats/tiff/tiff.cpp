@@ -15,7 +15,7 @@
 // description and resolution travel with the picture as well.
 //
 // A file that ends before its last pixel fails (status 3). A fault inside the data that the decoder
-// passes over is told in the record's `warning`. Source: Adobe, "TIFF Revision 6.0", 1992;
+// passes over is noted in the record's `warning`. Source: Adobe, "TIFF Revision 6.0", 1992;
 // Technical Notes 1 to 3; libtiff's documentation of BigTIFF.
 #include "formats/tiff/tiff.h"
 

@@ -64,7 +64,7 @@ class TiffOutput {
   // Bytes that the file has; and more of them, which the library knows nothing of.
   uint64_t End() const { return out_.Position(); }
   void Append(std::span<const uint8_t> bytes) { out_.Bytes(bytes); }
-  // Of the directory that was written: its place, and where in it the place of the next one stands.
+  // Of the directory that was written: its place, and where in it the place of the next one is.
   uint32_t Directory() const { return directory_; }
   uint32_t NextPlace() const { return directory_ + 2 + 12 * entries_; }
 

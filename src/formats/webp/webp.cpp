@@ -8,7 +8,7 @@
 //   then the frame's ALPH, VP8 or VP8L chunk
 //
 // Everything becomes 24 bits, with an alpha plane where the file has alpha. Frames of an animation
-// are its pages, each as it stands on the canvas after those before it. EXIF, XMP and ICC profile
+// are its pages, each as it is on the canvas after those before it. EXIF, XMP and ICC profile
 // travel with the picture.
 //
 // The writer makes lossy files of quality WebPQualityFactor, or lossless ones with WebPLossless,
@@ -244,7 +244,7 @@ Status ReadWithAlpha(WebpFile& file, int32_t frames, const PictureRecord& pictur
   return Status::Ok;
 }
 
-// An animation that does not tell of alpha may have it all the same; mostly it has not.
+// An animation that does not tell of alpha may have it anyway; mostly it has not.
 void DropOpaqueAlpha(Canvas& target) {
   for (int32_t y = 0; y < target.alpha.Height(); ++y) {
     const uint8_t* row = target.alpha.Row(y).data();

@@ -8,7 +8,7 @@
 //       12    2  key of the encryption, 0: none
 //       14    2  reserved
 //
-// Records of version 1 are a type, a size and data; in version 2 a class stands before the type and
+// Records of version 1 are a type, a size and data; in version 2 a class comes before the type and
 // a number of further records before the size. Sizes are 1 byte; or FF and 2 bytes; or FF and 4
 // bytes, the high word first, with its highest bit set.
 //

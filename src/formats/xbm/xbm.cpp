@@ -13,7 +13,7 @@
 // the next lower-case x, of which any that is no digit counts as 0. Lines are taken in pieces of at
 // most 260 characters.
 //
-// Where the width is no multiple of 8, the picture lies at the end of each row of values in place
+// Where the width is no multiple of 8, the picture is at the end of each row of values in place
 // of its beginning: reading drops the row's first pixels and shows its padding, writing puts black
 // padding in front. What this program wrote it reads back as it was; pictures of other programs
 // appear moved to the left.
@@ -194,7 +194,7 @@ void WriteLine(ByteWriter& out, std::string_view text) {
   out.Text(platform::kLineEnd);
 }
 
-// Writes values one after the other. A comma stands between two, and every twelfth ends its line.
+// Writes values one after the other. A comma comes between two, and every twelfth ends its line.
 class XbmValueWriter {
  public:
   XbmValueWriter(ByteWriter& out, uint64_t total) : out_(out), left_(total) {}

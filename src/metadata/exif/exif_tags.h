@@ -79,7 +79,7 @@ struct ExifTag {
 // Stands for no row of the dictionary.
 inline constexpr int32_t kNoExifTag = -1;
 
-// The dictionary in the order in which the editor offers it; each tag number stands in it once.
+// The dictionary in the order in which the editor offers it; each tag number is in it once.
 // Source: CIPA DC-008-2012, "Exchangeable image file format for digital still cameras: Exif
 // Version 2.3".
 std::span<const ExifTag> ExifTags();

@@ -13,7 +13,7 @@ namespace {
 // bytes; the block starts with so many and stays a multiple of them
 constexpr uint64_t kGrowth = 4096;
 
-// Whether a text is shown as it stands, being printable ASCII. Eight characters at a time: the text
+// Whether a text is shown as it is, being printable ASCII. Eight characters at a time: the text
 // of every value comes through here.
 bool IsPlain(std::string_view text) {
   constexpr uint64_t kOnes = 0x0101010101010101, kTops = 0x80 * kOnes;

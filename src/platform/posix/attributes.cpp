@@ -24,7 +24,7 @@ bool GoesAlong(std::string_view name) {
          name == kAccessList;
 }
 
-// The system's own, which it gives to new files by itself: nobody misses them.
+// The system's own, which it gives to new files by itself: no one misses them.
 bool IsMissed(std::string_view name) { return name.starts_with("user.") || name == kAccessList; }
 
 // What a call that fills a buffer gives, however long that is; false with errno.

@@ -208,7 +208,7 @@ void FirstStart::Listen(std::function<void(std::shared_ptr<LaterStart> start)> c
   };
   try {
     listener_ = std::thread(listenOn);
-  } catch (const std::system_error&) {  // no thread can be had: nobody hands anything over
+  } catch (const std::system_error&) {  // no thread can be had: no one hands anything over
   }
 }
 

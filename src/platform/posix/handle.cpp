@@ -54,7 +54,7 @@ CommitResult RenameOverPlaceholder(const std::string& from, const std::string& t
 bool Handle::Reset(int number) {
   const int old = number_;
   number_ = number;
-  // interrupted: the descriptor is closed all the same
+  // interrupted: the descriptor is closed anyway
   return old < 0 || close(old) == 0 || errno == EINTR;
 }
 

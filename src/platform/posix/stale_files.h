@@ -5,7 +5,7 @@
 namespace fotomill::platform {
 
 // Deletes the working files in a folder that a killed run of this program left: its own temporary
-// names, of a process of this user that is not there any more, which nobody has locked. Once for
+// names, of a process of this user that is not there any more, which no one has locked. Once for
 // each folder in a run.
 void DeleteStaleFiles(const std::string& folder);
 

@@ -28,7 +28,7 @@ Status FindFaces(const PackedImage& image, const FaceOptions& options,
 Rectangle AroundFaces(const std::vector<Rectangle>& faces, int32_t width, int32_t height);
 
 // Cuts a picture down to its largest face, or to all of them with `all`, and the room around. A
-// picture without a face, or where nobody can look for one, stays as it is. Statuses of CutPicture
+// picture without a face, or where no one can look for one, stays as it is. Statuses of CutPicture
 // and FunctionCancelled (4).
 Status FrameOnFaces(PictureRecord& picture, const FaceOptions& options, bool all,
                     const std::function<bool()>& goesOn = {});

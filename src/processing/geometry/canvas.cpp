@@ -63,7 +63,7 @@ std::optional<int32_t> EntryFor(PictureRecord& picture, const Backdrop& backdrop
   for (int32_t i = 0; i < image.Colors(); ++i) {
     if (std::memcmp(table.data() + 4 * i, bgr.data(), 3) == 0) return i;
   }
-  if (backdrop.alpha == 0) return 0;  // nobody sees its color
+  if (backdrop.alpha == 0) return 0;  // no one sees its color
   std::bitset<256> used;
   for (int32_t y = 0; y < image.Height(); ++y) {
     for (int32_t x = 0; x < image.Width(); ++x) used.set(static_cast<size_t>(image.PixelAt(x, y)));

@@ -70,7 +70,7 @@ struct Plan {
   void Shares(int32_t i, double* shares) const {
     const int32_t first = First(i), taps = End(i) - first;
     double sum = 0;
-    // Where a pixel lies exactly on a box's border, the order of these sums decides: it is that of
+    // Where a pixel is exactly on a box's border, the order of these sums decides: it is that of
     // the peers.
     for (int32_t t = 0; t < taps; ++t)
       sum += shares[t] = shape.value((t + first - Center(i) + 0.5) * (1 / widen));

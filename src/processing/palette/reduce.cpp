@@ -179,7 +179,7 @@ struct Reduction {
   int32_t colors = 2;
   int32_t handedOn = kHandedOnMono;  // sixteenths
   bool even = false;                 // the palette was not fitted
-  const Work* work = nullptr;        // asked now and then, where there is one
+  const Work* work = nullptr;        // asked now and then, if there is one
 
   int32_t Width() const { return picture.image.Width(); }
   int32_t Height() const { return picture.image.Height(); }

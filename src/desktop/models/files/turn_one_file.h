@@ -7,7 +7,7 @@
 
 namespace fotomill::desktop {
 
-// Turns the picture in a file and keeps what the file was. Neither step nor failure where it stands
+// Turns the picture in a file and keeps what the file was. Neither step nor failure if it is
 // so already.
 FileOperationResult TurnOneFile(const std::string& path, Orientation turn);
 

@@ -21,7 +21,7 @@ struct ExifRow {
 // The EXIF of one picture file as the viewer shows it.
 struct ExifReport {
   Status status = Status::Ok;
-  // a sentence for people where there is nothing to show, or not all; empty otherwise
+  // a sentence for people if there is nothing to show, or not all; empty otherwise
   std::string problem;
   std::vector<ExifRow> rows;
   // the same lines as one text, to be copied, saved or printed

@@ -32,7 +32,7 @@ struct Thumbnail {
   bool alpha = false;
   bool partial = false;   // the file ends early: the rest of the picture is missing
   bool animated = false;  // the pages are frames that follow each other
-  // the thumbnail that the file itself holds, which nobody has compared with the picture
+  // the thumbnail that the file itself holds, which no one has compared with the picture
   bool standIn = false;
 
   uint64_t Bytes() const { return sizeof *this + pixels.bytes.size(); }  // what it takes in a cache

@@ -15,7 +15,7 @@ namespace fotomill::desktop {
 
 // Loads thumbnails on threads of the pool, in the order in which they are wanted now. The request
 // of a result tells whether it is a stand-in; its thumbnail is null when there is none. Where a
-// stand-in was wanted and the proper one was ready, nobody loads it again.
+// stand-in was wanted and the proper one was ready, no one loads it again.
 class ThumbnailLoader {
  public:
   // A request that was dealt with.
@@ -25,7 +25,7 @@ class ThumbnailLoader {
   };
   using Load = ThumbnailPointer (*)(const ThumbnailRequest& request);
 
-  // `wake` is called on a worker when results wait that nobody was told of yet, `idle` on the
+  // `wake` is called on a worker when results wait that no one was told of yet, `idle` on the
   // worker that has done the last request.
   ThumbnailLoader(unsigned atOnce, std::function<void()> wake, Load load = LoadThumbnail,
                   void (*idle)() = KeepThumbnailRecords);

@@ -13,7 +13,7 @@
 namespace fotomill::desktop {
 
 // The offer to make missing thumbnail files of one folder, apart: it looks for them, asks, waits
-// for the answer as long as it takes, and makes them on all cores that nobody else wants.
+// for the answer as long as it takes, and makes them on all cores that no one else wants.
 class ThumbnailOffer : public std::enable_shared_from_this<ThumbnailOffer> {
  public:
   // Called apart.

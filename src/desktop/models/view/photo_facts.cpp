@@ -18,7 +18,7 @@ constexpr uint16_t kMake = 0x010f, kModel = 0x0110, kChanged = 0x0132, kExposure
                    kLensMake = 0xa433, kLens = 0xa434;
 constexpr double kLongestFraction = 0.3;  // seconds; longer exposures are told as decimals
 
-// The texts and first numbers of a walk; of a tag that stands in several directories, the first
+// The texts and first numbers of a walk; of a tag that is in several directories, the first
 // that has a value.
 class Values : public ExifSink {
  public:

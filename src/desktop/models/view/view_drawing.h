@@ -14,7 +14,7 @@ struct ViewSource {
   const PackedImage& alpha;
 };
 
-// What shows through a picture, and what lies around it. Colors are 0x00BBGGRR.
+// What shows through a picture, and what surrounds it. Colors are 0x00BBGGRR.
 struct Backdrop {
   Color around = 0;
   bool squares = false;  // a checkerboard behind the picture instead of `around`

@@ -68,7 +68,7 @@ struct ViewPicture {
   // Whether the file has become another one since.
   bool HasChanged() const;
 };
-// Shared between threads; nobody changes it once it is made.
+// Shared between threads; no one changes it once it is made.
 using ViewPicturePointer = std::shared_ptr<const ViewPicture>;
 
 // "4000 x 3000 pixels, 3.2 MB, 25%" of a picture at a scale, and whether its file is incomplete.
@@ -81,7 +81,7 @@ Status PixelsForOthers(const ViewPicture& view, Color background, RgbImage& pixe
 // Makes a decoded picture what the request of `view` asks for. Statuses of PrepareForDisplay.
 Status PrepareView(PicturePointer picture, ViewPicture& view);
 ViewPicturePointer LoadViewPicture(const ViewRequest& request);
-// A turned copy of a picture that was loaded; null where there is no memory for it.
+// A turned copy of a picture that was loaded; null if there is no memory for it.
 ViewPicturePointer TurnedView(const ViewPicture& view, Orientation turn);
 
 // Decodes pictures ahead, apart, and keeps those that are wanted up to a number of bytes.

@@ -14,7 +14,7 @@ namespace {
 // The scales of choice::ViewZoom 1 to 12.
 constexpr double kListedScales[] = {0.10, 0.20, 0.25, 1.0 / 3, 0.50, 0.75, 1, 1.5, 2, 3, 4, 8};
 
-// Where an edge of a picture of that length lies: in the middle when it fits, else with no gap at
+// Where an edge of a picture of that length is: in the middle when it fits, else with no gap at
 // either side.
 double KeptInside(double position, double length, double window) {
   if (length <= window) return (window - length) / 2;

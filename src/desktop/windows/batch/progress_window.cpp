@@ -204,7 +204,7 @@ void ProgressWindow::LayOut() {
   put(bar_,
       {layout.list.x, under + 2, layout.list.width, std::max(layout.status.y - under - 4, 2)});
   // The buttons for files that failed take the place of the one that stops, as wide as their texts
-  // where there is room.
+  // if there is room.
   const int gap = 4, room = layout.close.x - layout.list.x - 2 * gap;
   const int copy = InUnits(copy_->GetBestSize()).x, select = InUnits(select_->GetBestSize()).x;
   const int copyWidth = copy + select <= room ? copy : std::max(room * copy / (copy + select), 1);

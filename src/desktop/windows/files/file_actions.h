@@ -21,7 +21,7 @@ class FileActions : public wxEvtHandler {
   explicit FileActions(Shell& shell);
   ~FileActions() override = default;
 
-  // False when the user was asked and does not want it, where there is no trash.
+  // False when there is no trash and the user, being asked, declined.
   bool Trash(const std::vector<std::string>& paths);
   // The same of a file that `view` shows; asks first if PromptDeleteFromView wants it. False when
   // the answer was no, or other files are in progress.

@@ -34,7 +34,7 @@ class BoundControls : public SetupDialog {
 
  private:
   wxWindow& root_;
-  // Texts that are not UTF-8, as their bytes and as they are shown: one that nobody changed goes
+  // Texts that are not UTF-8, as their bytes and as they are shown: one that no one changed goes
   // back byte for byte.
   std::unordered_map<uint32_t, std::pair<std::string, wxString>> foreignTexts_;
 };

@@ -45,7 +45,7 @@ wxString TipOf(const KeyRow& row) {
 }
 
 wxWindow* MakeSpin(wxWindow* box, const KeyRow& row, wxWindowID id) {
-  // The range stands where the binding looks for it.
+  // The range is where the binding looks for it.
   auto* range = new wxStaticText(box, id + static_cast<int>(kSpinRangeControl),
                                  Shown(SpinRangeText(SpinRangeOf(row))));
   range->Hide();

@@ -8,7 +8,7 @@
 
 namespace fotomill::desktop {
 
-// What stands below an animation: a line that tells how far it is, with
+// What is below an animation: a line that tells how far it is, with
 // AnimationViewModeProgressBar, and buttons, with AnimationViewModeToolbar. Hidden until there is
 // something to tell.
 class AnimationBar : public wxPanel {

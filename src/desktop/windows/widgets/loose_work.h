@@ -10,7 +10,7 @@
 
 namespace fotomill::desktop {
 
-// Work that nobody waits for, since a folder may hang: it is asked to stop, and what it reports
+// Work that no one waits for, since a folder may hang: it is asked to stop, and what it reports
 // when nobody is interested any more is dropped. Goes with the window that wants its results.
 class LooseWork {
  public:
