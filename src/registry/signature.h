@@ -27,8 +27,8 @@ inline constexpr size_t kSignatureBytes = 512 + 32;
 FileKind IdentifySignature(std::span<const uint8_t> head);
 // The same for a file; nothing fits when it cannot be opened.
 FileKind IdentifyFile(const std::string& fileName);
-// What a file is whose name selects row `formatIndex` (kNoFormat: none) is wrong; nothing when the
-// contents are what the name says, or tell nothing.
+// What a file really is, if its name selects the wrong row `formatIndex` (kNoFormat: none). Nothing
+// if the contents match the name, or give no clue.
 FileKind KindBehindName(const std::string& fileName, int32_t formatIndex);
 
 }  // namespace fotomill
