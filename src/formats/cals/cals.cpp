@@ -18,12 +18,11 @@
 #include <cstdio>
 #include <string>
 #include <string_view>
-#include <vector>
 
 #include "core/byte_writer.h"
 #include "core/text.h"
 #include "formats/cals/t6_coding.h"
-#include "platform/file_view.h"
+#include "formats/plain_codec.h"
 #include "processing/geometry/orient.h"
 #include "processing/palette/two_colors.h"
 
@@ -91,16 +90,34 @@ Status ParseHeader(std::span<const uint8_t> file, CalsHeader& header) {
   return Status::Ok;
 }
 
-void DescribePicture(const CalsHeader& header, PictureRecord& picture) {
+Status DescribePicture(const platform::FileView& file, const ReadRequest&, CalsHeader& header,
+                       PictureRecord& picture) {
+  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
   const bool swaps = SwapsSides(header.orientation);
-  picture.width = swaps ? header.height : header.width;
-  picture.height = swaps ? header.width : header.height;
-  picture.bitsPerPixel = 1;
-  picture.imageBytes = EstimateImageBytes(picture.width, picture.height, 1);
-  picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
+  SetPlainFacts(picture, swaps ? header.height : header.width, swaps ? header.width : header.height,
+                1);
   picture.palette = BlackAndWhite(false);
   picture.metadata = {};
   picture.metadata.dpiX = picture.metadata.dpiY = std::max(header.density, 0);
+  return Status::Ok;
+}
+
+Status Decode(platform::FileView& file, const CalsHeader& header, const PictureRecord& picture,
+              PackedImage& image) {
+  const auto data = file.Bytes().subspan(kHeaderSize);
+  // a row is one bit at least
+  if (static_cast<uint64_t>(header.height) > 8 * data.size()) return Status::FileReadError;
+  PackedImage stored;
+  RETURN_IF_BAD(NewPackedImage(header.width, header.height, &picture.palette, 1, stored));
+  T6Decoder decoder(data, header.width);
+  for (int32_t y = 0; y < header.height; ++y) {
+    RETURN_IF_BAD(decoder.DecodeRow(stored.Row(y).first(header.RowSize())));
+    RETURN_IF_BAD(picture.ReportRow(y));
+  }
+  if (header.orientation != Orientation::Upright)
+    return OrientImage(stored, header.orientation, image);
+  image = std::move(stored);
+  return Status::Ok;
 }
 
 void WriteRecord(ByteWriter& out, std::string record) {
@@ -125,44 +142,16 @@ void WriteHeader(ByteWriter& out, const PictureRecord& picture, int32_t density)
   while (out.Position() < kHeaderSize) WriteRecord(out, "");
 }
 
+constexpr PlainCodec<CalsHeader> kCodec = {kHeaderSize, DescribePicture, Decode};
+
 }  // namespace
 
 Status CalsInfo(PictureRecord& picture, const ReadRequest& request) {
-  picture.typeName.Clear();
-  platform::FileView file;
-  if (!file.OpenHead(request.fileName.c_str(), kHeaderSize)) return Status::FileOpenError;
-  picture.fileSize = file.FileSize();
-  CalsHeader header;
-  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
-  DescribePicture(header, picture);
-  return Status::Ok;
+  return PlainInfo(kCodec, picture, request);
 }
 
 Status CalsRead(PictureRecord& picture, const ReadRequest& request) {
-  const ProgressScope progress(picture);
-  picture.image.Free();
-  picture.alpha.Free();
-  platform::FileView file;
-  if (!file.Open(request.fileName)) return Status::FileOpenError;
-  CalsHeader header;
-  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
-  DescribePicture(header, picture);
-  const auto data = file.Bytes().subspan(kHeaderSize);
-  // a row is one bit at least
-  if (static_cast<uint64_t>(header.height) > 8 * data.size()) return Status::FileReadError;
-  PackedImage image;
-  RETURN_IF_BAD(NewPackedImage(header.width, header.height, &picture.palette, 1, image));
-  T6Decoder decoder(data, header.width);
-  for (int32_t y = 0; y < header.height; ++y) {
-    RETURN_IF_BAD(decoder.DecodeRow(image.Row(y).first(header.RowSize())));
-    RETURN_IF_BAD(picture.ReportRow(y));
-  }
-  if (!file.Intact()) return Status::FileReadError;
-  if (header.orientation == Orientation::Upright) {
-    picture.image = std::move(image);
-    return Status::Ok;
-  }
-  return OrientImage(image, header.orientation, picture.image);
+  return PlainRead(kCodec, picture, request);
 }
 
 Status CalsWrite(PictureRecord& picture, const WriteOptions& options) {
@@ -177,12 +166,10 @@ Status CalsWrite(PictureRecord& picture, const WriteOptions& options) {
       out, picture,
       dpi >= 1 ? static_cast<int32_t>(std::min(dpi + 0.5, 9999.0)) : options.encode.resolution);
   T6Encoder encoder(image.Width());
-  std::vector<uint8_t> row((static_cast<size_t>(image.Width()) + 7) / 8);
-  const uint8_t invert = IsDarkFirst(picture.palette) ? 0xff : 0;
+  BlackAndWhiteRows rows(image, picture.palette, 1);
   for (int32_t y = 0; y < image.Height(); ++y) {
     RETURN_IF_BAD(picture.ReportRow(y));
-    for (size_t i = 0; i < row.size(); ++i) row[i] = image.Row(y)[i] ^ invert;
-    encoder.EncodeRow(row);
+    encoder.EncodeRow(rows.Row(y));
   }
   out.Bytes(encoder.Finish());
   return CommitOutput(out, options);

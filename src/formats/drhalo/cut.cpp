@@ -20,7 +20,7 @@
 #include "core/byte_reader.h"
 #include "core/byte_writer.h"
 #include "formats/drhalo/halo_palette.h"
-#include "platform/file_view.h"
+#include "formats/plain_codec.h"
 #include "processing/promote.h"
 
 namespace fotomill {
@@ -48,12 +48,10 @@ Status ParseHeader(std::span<const uint8_t> file, CutHeader& header) {
   return header.width < 1 || header.height < 1 || reserved != 0 ? Status::DamagedFile : Status::Ok;
 }
 
-void DescribePicture(const CutHeader& header, const ReadRequest& request, PictureRecord& picture) {
-  picture.width = header.width;
-  picture.height = header.height;
-  picture.bitsPerPixel = 8;
-  picture.imageBytes = EstimateImageBytes(header.width, header.height, 8);
-  picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
+Status DescribePicture(const platform::FileView& file, const ReadRequest& request,
+                       CutHeader& header, PictureRecord& picture) {
+  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
+  SetPlainFacts(picture, header.width, header.height, 8);
   picture.palette = GrayRamp();
   picture.warning.Clear();
   switch (ReadHaloPalette(request.fileName, picture.palette)) {
@@ -63,6 +61,7 @@ void DescribePicture(const CutHeader& header, const ReadRequest& request, Pictur
       [[fallthrough]];
     case HaloPaletteResult::Missing: picture.typeName.AssignCut("Dr. Halo without palette"); break;
   }
+  return Status::Ok;
 }
 
 // FileReadError when the code ends within a token.
@@ -85,8 +84,11 @@ Status DecodeRow(std::span<const uint8_t> code, std::span<uint8_t> row) {
   return Status::Ok;
 }
 
-Status ReadRows(platform::FileView& file, const CutHeader& header, const PictureRecord& picture,
-                PackedImage& image) {
+Status Decode(platform::FileView& file, const CutHeader& header, const PictureRecord& picture,
+              PackedImage& image) {
+  if (file.FileSize() - kHeaderSize < kLeastRowSize * static_cast<uint64_t>(header.height))
+    return Status::FileReadError;
+  RETURN_IF_BAD(NewPackedImage(header.width, header.height, &picture.palette, 8, image));
   ByteReader bytes(file.Bytes());
   bytes.Seek(kHeaderSize);
   for (int32_t y = 0; y < header.height; ++y) {
@@ -143,37 +145,17 @@ Status WriteRows(ByteWriter& out, const PictureRecord& picture, const PackedImag
   return out.WriteRest() ? Status::Ok : Status::ErrorWritingFile;
 }
 
+constexpr PlainCodec<CutHeader> kCodec = {kHeaderSize, DescribePicture, Decode};
+
 }  // namespace
 
 Status CutInfo(PictureRecord& picture, const ReadRequest& request) {
-  picture.typeName.Clear();
   if (request.signedOnly) return Status::UnsupportedFormat;
-  platform::FileView file;
-  if (!file.OpenHead(request.fileName.c_str(), kHeaderSize)) return Status::FileOpenError;
-  picture.fileSize = file.FileSize();
-  CutHeader header;
-  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
-  DescribePicture(header, request, picture);
-  return Status::Ok;
+  return PlainInfo(kCodec, picture, request);
 }
 
 Status CutRead(PictureRecord& picture, const ReadRequest& request) {
-  const ProgressScope progress(picture);
-  picture.image.Free();
-  picture.alpha.Free();
-  platform::FileView file;
-  if (!file.Open(request.fileName)) return Status::FileOpenError;
-  CutHeader header;
-  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
-  DescribePicture(header, request, picture);
-  if (file.FileSize() - kHeaderSize < kLeastRowSize * static_cast<uint64_t>(header.height))
-    return Status::FileReadError;
-  PackedImage image;
-  RETURN_IF_BAD(NewPackedImage(header.width, header.height, &picture.palette, 8, image));
-  RETURN_IF_BAD(ReadRows(file, header, picture, image));
-  if (!file.Intact()) return Status::FileReadError;
-  picture.image = std::move(image);
-  return Status::Ok;
+  return PlainRead(kCodec, picture, request);
 }
 
 Status CutWrite(PictureRecord& picture, const WriteOptions& options) {

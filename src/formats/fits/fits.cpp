@@ -33,7 +33,7 @@
 #include "core/creator.h"
 #include "core/limits.h"
 #include "core/text.h"
-#include "platform/file_view.h"
+#include "formats/plain_codec.h"
 #include "processing/pixel_rows.h"
 
 namespace fotomill {
@@ -207,18 +207,14 @@ void WriteHeader(ByteWriter& out, const PackedImage& image) {
 }
 
 // Parses the header and fills the record's facts.
-Status DescribePicture(const platform::FileView& file, PictureRecord& picture, FitsHeader& header) {
-  picture.typeName.Clear();
-  picture.fileSize = file.FileSize();
+Status DescribePicture(const platform::FileView& file, const ReadRequest&, FitsHeader& header,
+                       PictureRecord& picture) {
   header = ParseHeader(file.Bytes());
   RETURN_IF_BAD(CheckHeader(header));
-  picture.width = static_cast<int32_t>(header.width);
-  picture.height = static_cast<int32_t>(header.height);
-  picture.bitsPerPixel = 8;
+  SetPlainFacts(picture, static_cast<int32_t>(header.width), static_cast<int32_t>(header.height),
+                8);
   picture.simplified = header.bitsPerValue > 8 || header.axes > 2;
   picture.unread = header.bitsPerValue > 8 ? kUnreadDepth : uint8_t{0};
-  picture.imageBytes = EstimateImageBytes(picture.width, picture.height, 8);
-  picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
   picture.palette = GrayRamp();
   picture.typeName.AssignCut(std::to_string(header.axes) + " axis - " +
                              std::to_string(header.bitsPerValue) + " bits of grey");
@@ -234,30 +230,11 @@ Status CheckRowsFit(const platform::FileView& file, const FitsHeader& header) {
   return header.ended && counted && end <= file.FileSize() ? Status::Ok : Status::FileReadError;
 }
 
-}  // namespace
-
-Status FitsInfo(PictureRecord& picture, const ReadRequest& request) {
-  platform::FileView file;
-  if (!file.OpenHead(request.fileName.c_str(), limits.fitsCards * kCardBytes))
-    return Status::FileOpenError;
-  if (file.Bytes().size() < kSignature.size()) return Status::FileReadError;
-  if (!ByteReader(file.Bytes()).Match(kSignature)) return Status::DamagedFile;
-  FitsHeader header;
-  return DescribePicture(file, picture, header);
-}
-
-Status FitsRead(PictureRecord& picture, const ReadRequest& request) {
-  const ProgressScope progress(picture);
-  picture.image.Free();
-  picture.alpha.Free();
-  platform::FileView file;
-  if (!file.Open(request.fileName)) return Status::FileOpenError;
-  FitsHeader header;
-  RETURN_IF_BAD(DescribePicture(file, picture, header));
+Status Decode(platform::FileView& file, const FitsHeader& header, const PictureRecord& picture,
+              PackedImage& image) {
   RETURN_IF_BAD(CheckRowsFit(file, header));
-
-  PackedImage image;
-  RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette, 8, image, platform::Fill::Unset));
+  RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette, 8, image,
+                               platform::Fill::Unset));
   ByteReader bytes(file.Bytes());
   bytes.Seek(header.dataOffset);
   for (int32_t y = 0; y < picture.height; ++y) {
@@ -265,9 +242,27 @@ Status FitsRead(PictureRecord& picture, const ReadRequest& request) {
     file.DropBefore(bytes.Position());
     RETURN_IF_BAD(picture.ReportRow(y));
   }
-  if (!file.Intact()) return Status::FileReadError;
-  picture.image = std::move(image);
   return Status::Ok;
+}
+
+}  // namespace
+
+// Asks for the signature first, which `read` does without.
+Status FitsInfo(PictureRecord& picture, const ReadRequest& request) {
+  picture.typeName.Clear();
+  platform::FileView file;
+  if (!file.OpenHead(request.fileName.c_str(), limits.fitsCards * kCardBytes))
+    return Status::FileOpenError;
+  if (file.Bytes().size() < kSignature.size()) return Status::FileReadError;
+  if (!ByteReader(file.Bytes()).Match(kSignature)) return Status::DamagedFile;
+  picture.fileSize = file.FileSize();
+  FitsHeader header;
+  return DescribePicture(file, request, header, picture);
+}
+
+Status FitsRead(PictureRecord& picture, const ReadRequest& request) {
+  const PlainCodec<FitsHeader> codec = {limits.fitsCards * kCardBytes, DescribePicture, Decode};
+  return PlainRead(codec, picture, request);
 }
 
 Status FitsWrite(PictureRecord& picture, const WriteOptions& options) {

@@ -41,7 +41,7 @@
 #include "core/byte_writer.h"
 #include "formats/amiga/iff_planes.h"
 #include "formats/gem/gem_lines.h"
-#include "platform/file_view.h"
+#include "formats/plain_codec.h"
 #include "processing/palette/two_colors.h"
 #include "processing/pixel_rows.h"
 #include "processing/promote.h"
@@ -187,16 +187,12 @@ Status ParseHeader(std::span<const uint8_t> file, GemHeader& header, Palette& pa
   return header.form == Form::Pixels && !pixels ? Status::UnsupportedFormat : Status::Ok;
 }
 
-Status DescribePicture(std::span<const uint8_t> file, PictureRecord& picture, GemHeader& header) {
-  picture.typeName.Clear();
-  RETURN_IF_BAD(ParseHeader(file, header, picture.palette));
+Status DescribePicture(const platform::FileView& file, const ReadRequest&, GemHeader& header,
+                       PictureRecord& picture) {
+  RETURN_IF_BAD(ParseHeader(file.Bytes(), header, picture.palette));
   picture.typeName.AssignCut(header.name);
-  picture.width = header.width;
-  picture.height = header.height;
   const bool indices = header.form == Form::Planes || header.form == Form::WholePlanes;
-  picture.bitsPerPixel = indices ? header.planes : 24;
-  picture.imageBytes = EstimateImageBytes(header.width, header.height, picture.bitsPerPixel);
-  picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
+  SetPlainFacts(picture, header.width, header.height, indices ? header.planes : 24);
   return Status::Ok;
 }
 
@@ -266,8 +262,10 @@ Status GatherPlanes(GemLines& source, const GemHeader& header, std::vector<uint8
   return Status::Ok;
 }
 
-Status ReadRows(platform::FileView& file, const GemHeader& header, const PictureRecord& picture,
-                PackedImage& image) {
+Status Decode(platform::FileView& file, const GemHeader& header, const PictureRecord& picture,
+              PackedImage& image) {
+  RETURN_IF_BAD(
+      NewPackedImage(header.width, header.height, &picture.palette, picture.bitsPerPixel, image));
   GemLines source(file.Bytes().subspan(header.size), header.LineSize(), header.patternSize);
   std::vector<uint8_t> gathered, indices(static_cast<size_t>(header.width));
   const bool whole = header.form == Form::WholePlanes;
@@ -373,31 +371,16 @@ Status WriteRows(ByteWriter& out, const PictureRecord& picture, const GemLayout&
   return Status::Ok;
 }
 
+constexpr PlainCodec<GemHeader> kCodec = {kMostHeaderSize, DescribePicture, Decode};
+
 }  // namespace
 
 Status GemInfo(PictureRecord& picture, const ReadRequest& request) {
-  platform::FileView file;
-  if (!file.OpenHead(request.fileName.c_str(), kMostHeaderSize)) return Status::FileOpenError;
-  picture.fileSize = file.FileSize();
-  GemHeader header;
-  return DescribePicture(file.Bytes(), picture, header);
+  return PlainInfo(kCodec, picture, request);
 }
 
 Status GemRead(PictureRecord& picture, const ReadRequest& request) {
-  const ProgressScope progress(picture);
-  picture.image.Free();
-  picture.alpha.Free();
-  platform::FileView file;
-  if (!file.Open(request.fileName)) return Status::FileOpenError;
-  GemHeader header;
-  RETURN_IF_BAD(DescribePicture(file.Bytes(), picture, header));
-  PackedImage image;
-  RETURN_IF_BAD(
-      NewPackedImage(header.width, header.height, &picture.palette, picture.bitsPerPixel, image));
-  RETURN_IF_BAD(ReadRows(file, header, picture, image));
-  if (!file.Intact()) return Status::FileReadError;
-  picture.image = std::move(image);
-  return Status::Ok;
+  return PlainRead(kCodec, picture, request);
 }
 
 Status GemWrite(PictureRecord& picture, const WriteOptions& options) {

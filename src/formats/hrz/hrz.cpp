@@ -9,7 +9,7 @@
 #include <array>
 
 #include "core/byte_writer.h"
-#include "platform/file_view.h"
+#include "formats/plain_codec.h"
 #include "processing/promote.h"
 
 namespace fotomill {
@@ -20,41 +20,24 @@ constexpr int32_t kWidth = kHrzWidth, kHeight = kHrzHeight;
 constexpr size_t kRowSize = 3 * kWidth;
 constexpr uint64_t kFileSize = kRowSize * kHeight;
 
+struct HrzHeader {};  // such files have none
+
 constexpr uint8_t Widened(uint8_t level) {
   const uint8_t six = level & 63;
   return static_cast<uint8_t>(six << 2 | six >> 4);
 }
 
-Status DescribePicture(const platform::FileView& file, PictureRecord& picture) {
-  picture.typeName.Clear();
-  picture.fileSize = file.FileSize();
+Status DescribePicture(const platform::FileView& file, const ReadRequest&, HrzHeader&,
+                       PictureRecord& picture) {
   if (file.FileSize() != kFileSize)
     return file.FileSize() < kFileSize ? Status::FileReadError : Status::DamagedFile;
-  picture.width = kWidth;
-  picture.height = kHeight;
-  picture.bitsPerPixel = 24;
-  picture.imageBytes = EstimateImageBytes(kWidth, kHeight, 24);
-  picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
+  SetPlainFacts(picture, kWidth, kHeight, 24);
   MakeDefaultPalette(&picture.palette, nullptr, kDisplayPalette);
   return Status::Ok;
 }
 
-}  // namespace
-
-Status HrzInfo(PictureRecord& picture, const ReadRequest& request) {
-  platform::FileView file;
-  if (!file.OpenHead(request.fileName.c_str(), 1)) return Status::FileOpenError;
-  return DescribePicture(file, picture);
-}
-
-Status HrzRead(PictureRecord& picture, const ReadRequest& request) {
-  const ProgressScope progress(picture);
-  picture.image.Free();
-  picture.alpha.Free();
-  platform::FileView file;
-  if (!file.Open(request.fileName)) return Status::FileOpenError;
-  RETURN_IF_BAD(DescribePicture(file, picture));
-  PackedImage image;
+Status Decode(platform::FileView& file, const HrzHeader&, const PictureRecord& picture,
+              PackedImage& image) {
   RETURN_IF_BAD(NewPackedImage(kWidth, kHeight, &picture.palette, 24, image));
   const uint8_t* source = file.Bytes().data();
   for (int32_t y = 0; y < kHeight; ++y) {
@@ -66,9 +49,19 @@ Status HrzRead(PictureRecord& picture, const ReadRequest& request) {
     }
     RETURN_IF_BAD(picture.ReportRow(y));
   }
-  if (!file.Intact()) return Status::FileReadError;
-  picture.image = std::move(image);
   return Status::Ok;
+}
+
+constexpr PlainCodec<HrzHeader> kCodec = {1, DescribePicture, Decode};
+
+}  // namespace
+
+Status HrzInfo(PictureRecord& picture, const ReadRequest& request) {
+  return PlainInfo(kCodec, picture, request);
+}
+
+Status HrzRead(PictureRecord& picture, const ReadRequest& request) {
+  return PlainRead(kCodec, picture, request);
 }
 
 Status HrzWrite(PictureRecord& picture, const WriteOptions& options) {

@@ -39,8 +39,8 @@
 #include "core/byte_writer.h"
 #include "core/creator.h"
 #include "core/text.h"
+#include "formats/plain_codec.h"
 #include "platform/clock.h"
-#include "platform/file_view.h"
 #include "platform/paths.h"
 
 namespace fotomill {
@@ -75,6 +75,10 @@ std::string_view MacBinaryName(std::span<const uint8_t> bytes) {
   const auto name = reader.Take(std::min<size_t>(reader.U8(), kNameBytes));
   return {reinterpret_cast<const char*>(name.data()), name.size()};
 }
+
+struct MacHeader {
+  uint64_t rowsOffset = 0;
+};
 
 // Where the rows begin.
 uint64_t RowsOffset(std::span<const uint8_t> bytes) {
@@ -175,47 +179,39 @@ void WriteMacPaintHeader(ByteWriter& out) {
 }
 
 // Fills the record's facts from the head of the file.
-Status DescribePicture(const platform::FileView& file, PictureRecord& picture) {
-  picture.typeName.Clear();
-  picture.fileSize = file.FileSize();
+Status DescribePicture(const platform::FileView& file, const ReadRequest&, MacHeader& header,
+                       PictureRecord& picture) {
   if (file.Bytes().size() < kMacBinarySize) return Status::FileReadError;
   if (HasMacBinaryHeader(file.Bytes())) picture.typeName.AssignCut(MacBinaryName(file.Bytes()));
-  picture.width = kWidth;
-  picture.height = kHeight;
-  picture.imageBytes = kRowBytes * kHeight;
-  picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
-  MakeDefaultPalette(&picture.palette, &picture.bitsPerPixel, kBlackAndWhitePalette);
+  header.rowsOffset = RowsOffset(file.Bytes());
+  SetPlainFacts(picture, kWidth, kHeight, 1);
+  MakeDefaultPalette(&picture.palette, nullptr, kBlackAndWhitePalette);
   return Status::Ok;
 }
+
+Status Decode(platform::FileView& file, const MacHeader& header, const PictureRecord& picture,
+              PackedImage& image) {
+  RETURN_IF_BAD(NewPackedImage(kWidth, kHeight, &picture.palette, 1, image));
+  ByteReader bytes(file.Bytes());
+  bytes.Seek(header.rowsOffset);
+  for (int32_t y = 0; y < kHeight; ++y) {
+    RETURN_IF_BAD(UnpackRow(bytes, image.Row(y)));
+    RETURN_IF_BAD(picture.ReportRow(y, kHeight));
+  }
+  return Status::Ok;
+}
+
+constexpr PlainCodec<MacHeader> kCodec = {kMacBinarySize, DescribePicture, Decode};
 
 }  // namespace
 
 Status MacInfo(PictureRecord& picture, const ReadRequest& request) {
   if (request.signedOnly) return Status::UnsupportedFormat;
-  platform::FileView file;
-  if (!file.OpenHead(request.fileName.c_str(), kMacBinarySize)) return Status::FileOpenError;
-  return DescribePicture(file, picture);
+  return PlainInfo(kCodec, picture, request);
 }
 
 Status MacRead(PictureRecord& picture, const ReadRequest& request) {
-  const ProgressScope progress(picture);
-  picture.image.Free();
-  picture.alpha.Free();
-  platform::FileView file;
-  if (!file.Open(request.fileName)) return Status::FileOpenError;
-  RETURN_IF_BAD(DescribePicture(file, picture));
-
-  PackedImage image;
-  RETURN_IF_BAD(NewPackedImage(kWidth, kHeight, &picture.palette, 1, image));
-  ByteReader bytes(file.Bytes());
-  bytes.Seek(RowsOffset(file.Bytes()));
-  for (int32_t y = 0; y < kHeight; ++y) {
-    RETURN_IF_BAD(UnpackRow(bytes, image.Row(y)));
-    RETURN_IF_BAD(picture.ReportRow(y, kHeight));
-  }
-  if (!file.Intact()) return Status::FileReadError;
-  picture.image = std::move(image);
-  return Status::Ok;
+  return PlainRead(kCodec, picture, request);
 }
 
 Status MacWrite(PictureRecord& picture, const WriteOptions& options) {

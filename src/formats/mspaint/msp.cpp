@@ -26,7 +26,7 @@
 
 #include "core/byte_reader.h"
 #include "core/byte_writer.h"
-#include "platform/file_view.h"
+#include "formats/plain_codec.h"
 #include "processing/palette/two_colors.h"
 
 namespace fotomill {
@@ -58,15 +58,14 @@ Status ParseHeader(std::span<const uint8_t> file, MspHeader& header) {
   return header.width < 1 || header.height < 1 ? Status::DamagedFile : Status::Ok;
 }
 
-void DescribePicture(const MspHeader& header, PictureRecord& picture) {
+Status DescribePicture(const platform::FileView& file, const ReadRequest&, MspHeader& header,
+                       PictureRecord& picture) {
+  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
   picture.typeName.AssignCut(header.coded ? "Microsoft Paint, version 2"
                                           : "Microsoft Paint, version 1");
-  picture.width = header.width;
-  picture.height = header.height;
-  picture.bitsPerPixel = 1;
-  picture.imageBytes = EstimateImageBytes(header.width, header.height, 1);
-  picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
+  SetPlainFacts(picture, header.width, header.height, 1);
   picture.palette = BlackAndWhite(true);
+  return Status::Ok;
 }
 
 void DecodeRow(std::span<const uint8_t> code, std::span<uint8_t> row) {
@@ -85,9 +84,13 @@ void DecodeRow(std::span<const uint8_t> code, std::span<uint8_t> row) {
   }
 }
 
-Status ReadRows(std::span<const uint8_t> file, const MspHeader& header,
-                const PictureRecord& picture, PackedImage& image) {
-  ByteReader sizes(file), bytes(file);
+Status Decode(platform::FileView& file, const MspHeader& header, const PictureRecord& picture,
+              PackedImage& image) {
+  const uint64_t least = header.coded ? 2 : header.RowSize();
+  if (file.FileSize() - kHeaderSize < least * static_cast<uint64_t>(header.height))
+    return Status::FileReadError;
+  RETURN_IF_BAD(NewPackedImage(header.width, header.height, &picture.palette, 1, image));
+  ByteReader sizes(file.Bytes()), bytes(file.Bytes());
   sizes.Seek(kHeaderSize);
   bytes.Seek(kHeaderSize + (header.coded ? 2 * static_cast<uint64_t>(header.height) : 0));
   for (int32_t y = 0; y < header.height; ++y) {
@@ -147,12 +150,12 @@ void EncodeRow(std::span<const uint8_t> row, std::vector<uint8_t>& code) {
 Status WriteRows(ByteWriter& out, const PictureRecord& picture) {
   const PackedImage& image = picture.image;
   const auto width = static_cast<size_t>(image.Width());
-  const uint8_t invert = IsDarkFirst(picture.palette) ? 0 : 0xff;
-  std::vector<uint8_t> row((width + 7) / 8), code, sizes;
+  BlackAndWhiteRows rows(image, picture.palette, 0);
+  std::vector<uint8_t> code, sizes;
   out.Zeros(2 * static_cast<uint64_t>(image.Height()));
   for (int32_t y = 0; y < image.Height() && !out.Failed(); ++y) {
     RETURN_IF_BAD(picture.ReportRow(y));
-    for (size_t i = 0; i < row.size(); ++i) row[i] = image.Row(y)[i] ^ invert;
+    const auto row = rows.Row(y);
     if (width % 8 != 0) row.back() |= static_cast<uint8_t>(0xff >> width % 8);
     EncodeRow(row, code);
     if (code.size() > UINT16_MAX) return Status::UnsuitableImage;
@@ -164,37 +167,16 @@ Status WriteRows(ByteWriter& out, const PictureRecord& picture) {
   return Status::Ok;
 }
 
+constexpr PlainCodec<MspHeader> kCodec = {kHeaderSize, DescribePicture, Decode};
+
 }  // namespace
 
 Status MspInfo(PictureRecord& picture, const ReadRequest& request) {
-  picture.typeName.Clear();
-  platform::FileView file;
-  if (!file.OpenHead(request.fileName.c_str(), kHeaderSize)) return Status::FileOpenError;
-  picture.fileSize = file.FileSize();
-  MspHeader header;
-  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
-  DescribePicture(header, picture);
-  return Status::Ok;
+  return PlainInfo(kCodec, picture, request);
 }
 
 Status MspRead(PictureRecord& picture, const ReadRequest& request) {
-  const ProgressScope progress(picture);
-  picture.image.Free();
-  picture.alpha.Free();
-  platform::FileView file;
-  if (!file.Open(request.fileName)) return Status::FileOpenError;
-  MspHeader header;
-  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
-  DescribePicture(header, picture);
-  const uint64_t least = header.coded ? 2 : header.RowSize();
-  if (file.FileSize() - kHeaderSize < least * static_cast<uint64_t>(header.height))
-    return Status::FileReadError;
-  PackedImage image;
-  RETURN_IF_BAD(NewPackedImage(header.width, header.height, &picture.palette, 1, image));
-  RETURN_IF_BAD(ReadRows(file.Bytes(), header, picture, image));
-  if (!file.Intact()) return Status::FileReadError;
-  picture.image = std::move(image);
-  return Status::Ok;
+  return PlainRead(kCodec, picture, request);
 }
 
 Status MspWrite(PictureRecord& picture, const WriteOptions& options) {

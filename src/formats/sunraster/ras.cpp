@@ -27,7 +27,7 @@
 
 #include "core/byte_reader.h"
 #include "core/byte_writer.h"
-#include "platform/file_view.h"
+#include "formats/plain_codec.h"
 #include "processing/pixel_rows.h"
 
 namespace fotomill {
@@ -91,17 +91,16 @@ void ReadPalette(std::span<const uint8_t> file, const RasHeader& header, Palette
   }
 }
 
-void DescribePicture(std::span<const uint8_t> file, const RasHeader& header,
-                     PictureRecord& picture) {
+Status DescribePicture(const platform::FileView& file, const ReadRequest&, RasHeader& header,
+                       PictureRecord& picture) {
   constexpr const char* kNames[] = {"Sun raster, old", "Sun raster", "Sun raster, byte-encoded",
                                     "Sun raster, RGB"};
+  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
   picture.typeName.AssignCut(kNames[header.type]);
-  picture.width = static_cast<int32_t>(header.width);
-  picture.height = static_cast<int32_t>(header.height);
-  picture.bitsPerPixel = static_cast<int32_t>(std::min(header.bits, 24u));
-  picture.imageBytes = EstimateImageBytes(picture.width, picture.height, picture.bitsPerPixel);
-  picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
-  ReadPalette(file, header, picture.palette);
+  SetPlainFacts(picture, static_cast<int32_t>(header.width), static_cast<int32_t>(header.height),
+                static_cast<int32_t>(std::min(header.bits, 24u)));
+  ReadPalette(file.Bytes(), header, picture.palette);
+  return Status::Ok;
 }
 
 // The bytes of one row after another, whether encoded or not.
@@ -184,6 +183,27 @@ PutRow ChooseRow(const RasHeader& header) {
   }
 }
 
+Status Decode(platform::FileView& file, const RasHeader& header, const PictureRecord& picture,
+              PackedImage& image) {
+  if (file.FileSize() < header.PixelOffset()) return Status::FileReadError;
+  const auto pixels = file.Bytes().subspan(header.PixelOffset());
+  // A run makes at most 256 bytes of three.
+  const uint64_t least = header.RowSize() * header.height / (header.type == kByteEncoded ? 86 : 1);
+  if (pixels.size() < least) return Status::FileReadError;
+  RETURN_IF_BAD(
+      NewPackedImage(picture.width, picture.height, &picture.palette, picture.bitsPerPixel, image));
+  RowSource source(pixels, header);
+  const PutRow put = ChooseRow(header);
+  for (int32_t y = 0; y < picture.height; ++y) {
+    const auto row = source.Next();
+    if (row.empty()) return Status::FileReadError;
+    put(row.data(), header.width, image.Row(y).data());
+    file.DropBefore(header.PixelOffset() + source.Position());
+    RETURN_IF_BAD(picture.ReportRow(y));
+  }
+  return Status::Ok;
+}
+
 // What the writer stores for a picture.
 struct RasLayout {
   uint32_t bits = 24;
@@ -232,48 +252,16 @@ void MakeRow(const PackedImage& image, int32_t y, const RasLayout& layout,
   }
 }
 
+constexpr PlainCodec<RasHeader> kCodec = {kHeadSize, DescribePicture, Decode};
+
 }  // namespace
 
 Status RasInfo(PictureRecord& picture, const ReadRequest& request) {
-  picture.typeName.Clear();
-  platform::FileView file;
-  if (!file.OpenHead(request.fileName.c_str(), kHeadSize)) return Status::FileOpenError;
-  picture.fileSize = file.FileSize();
-  RasHeader header;
-  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
-  DescribePicture(file.Bytes(), header, picture);
-  return Status::Ok;
+  return PlainInfo(kCodec, picture, request);
 }
 
 Status RasRead(PictureRecord& picture, const ReadRequest& request) {
-  const ProgressScope progress(picture);
-  picture.image.Free();
-  picture.alpha.Free();
-  platform::FileView file;
-  if (!file.Open(request.fileName)) return Status::FileOpenError;
-  RasHeader header;
-  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
-  DescribePicture(file.Bytes(), header, picture);
-
-  if (file.FileSize() < header.PixelOffset()) return Status::FileReadError;
-  const auto pixels = file.Bytes().subspan(header.PixelOffset());
-  // A run makes at most 256 bytes of three.
-  const uint64_t least = header.RowSize() * header.height / (header.type == kByteEncoded ? 86 : 1);
-  if (pixels.size() < least) return Status::FileReadError;
-  PackedImage image;
-  RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette, picture.bitsPerPixel, image));
-  RowSource source(pixels, header);
-  const PutRow put = ChooseRow(header);
-  for (int32_t y = 0; y < picture.height; ++y) {
-    const auto row = source.Next();
-    if (row.empty()) return Status::FileReadError;
-    put(row.data(), header.width, image.Row(y).data());
-    file.DropBefore(header.PixelOffset() + source.Position());
-    RETURN_IF_BAD(picture.ReportRow(y));
-  }
-  if (!file.Intact()) return Status::FileReadError;
-  picture.image = std::move(image);
-  return Status::Ok;
+  return PlainRead(kCodec, picture, request);
 }
 
 Status RasWrite(PictureRecord& picture, const WriteOptions& options) {

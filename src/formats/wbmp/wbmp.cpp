@@ -10,11 +10,10 @@
 #include "formats/wbmp/wbmp.h"
 
 #include <algorithm>
-#include <vector>
 
 #include "core/byte_reader.h"
 #include "core/byte_writer.h"
-#include "platform/file_view.h"
+#include "formats/plain_codec.h"
 #include "processing/palette/two_colors.h"
 
 namespace fotomill {
@@ -56,13 +55,28 @@ Status ParseHeader(std::span<const uint8_t> file, WbmpHeader& header) {
   return header.width < 1 || header.height < 1 ? Status::DamagedFile : Status::Ok;
 }
 
-void DescribePicture(const WbmpHeader& header, PictureRecord& picture) {
-  picture.width = header.width;
-  picture.height = header.height;
-  picture.bitsPerPixel = 1;
-  picture.imageBytes = EstimateImageBytes(header.width, header.height, 1);
-  picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
+Status DescribePicture(const platform::FileView& file, const ReadRequest&, WbmpHeader& header,
+                       PictureRecord& picture) {
+  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
+  SetPlainFacts(picture, header.width, header.height, 1);
   picture.palette = BlackAndWhite(true);
+  return Status::Ok;
+}
+
+Status Decode(platform::FileView& file, const WbmpHeader& header, const PictureRecord& picture,
+              PackedImage& image) {
+  if (file.FileSize() - header.pixelOffset <
+      header.RowSize() * static_cast<uint64_t>(header.height))
+    return Status::FileReadError;
+  RETURN_IF_BAD(NewPackedImage(header.width, header.height, &picture.palette, 1, image));
+  ByteReader bytes(file.Bytes());
+  bytes.Seek(header.pixelOffset);
+  for (int32_t y = 0; y < header.height; ++y) {
+    std::ranges::copy(bytes.Take(header.RowSize()), image.Row(y).begin());
+    file.DropBefore(bytes.Position());
+    RETURN_IF_BAD(picture.ReportRow(y));
+  }
+  return Status::Ok;
 }
 
 void WriteNumber(ByteWriter& out, int32_t number) {
@@ -72,43 +86,16 @@ void WriteNumber(ByteWriter& out, int32_t number) {
   out.U8(static_cast<uint8_t>(number & 0x7f));
 }
 
+constexpr PlainCodec<WbmpHeader> kCodec = {kLongestHeader, DescribePicture, Decode};
+
 }  // namespace
 
 Status WbmpInfo(PictureRecord& picture, const ReadRequest& request) {
-  picture.typeName.Clear();
-  platform::FileView file;
-  if (!file.OpenHead(request.fileName.c_str(), kLongestHeader)) return Status::FileOpenError;
-  picture.fileSize = file.FileSize();
-  WbmpHeader header;
-  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
-  DescribePicture(header, picture);
-  return Status::Ok;
+  return PlainInfo(kCodec, picture, request);
 }
 
 Status WbmpRead(PictureRecord& picture, const ReadRequest& request) {
-  const ProgressScope progress(picture);
-  picture.image.Free();
-  picture.alpha.Free();
-  platform::FileView file;
-  if (!file.Open(request.fileName)) return Status::FileOpenError;
-  WbmpHeader header;
-  RETURN_IF_BAD(ParseHeader(file.Bytes(), header));
-  DescribePicture(header, picture);
-  if (file.FileSize() - header.pixelOffset <
-      header.RowSize() * static_cast<uint64_t>(header.height))
-    return Status::FileReadError;
-  PackedImage image;
-  RETURN_IF_BAD(NewPackedImage(header.width, header.height, &picture.palette, 1, image));
-  ByteReader bytes(file.Bytes());
-  bytes.Seek(header.pixelOffset);
-  for (int32_t y = 0; y < header.height; ++y) {
-    std::ranges::copy(bytes.Take(header.RowSize()), image.Row(y).begin());
-    file.DropBefore(bytes.Position());
-    RETURN_IF_BAD(picture.ReportRow(y));
-  }
-  if (!file.Intact()) return Status::FileReadError;
-  picture.image = std::move(image);
-  return Status::Ok;
+  return PlainRead(kCodec, picture, request);
 }
 
 Status WbmpWrite(PictureRecord& picture, const WriteOptions& options) {
@@ -122,12 +109,10 @@ Status WbmpWrite(PictureRecord& picture, const WriteOptions& options) {
   out.U8(0);
   WriteNumber(out, image.Width());
   WriteNumber(out, image.Height());
-  std::vector<uint8_t> bytes((static_cast<size_t>(image.Width()) + 7) / 8);
-  const uint8_t invert = IsDarkFirst(picture.palette) ? 0 : 0xff;
+  BlackAndWhiteRows rows(image, picture.palette, 0);
   for (int32_t y = 0; y < image.Height() && !out.Failed(); ++y) {
     RETURN_IF_BAD(picture.ReportRow(y));
-    for (size_t i = 0; i < bytes.size(); ++i) bytes[i] = image.Row(y)[i] ^ invert;
-    out.Bytes(bytes);
+    out.Bytes(rows.Row(y));
   }
   return CommitOutput(out, options);
 }

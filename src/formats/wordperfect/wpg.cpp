@@ -38,8 +38,8 @@
 
 #include "core/byte_reader.h"
 #include "core/byte_writer.h"
+#include "formats/plain_codec.h"
 #include "formats/wordperfect/wpg_rows.h"
-#include "platform/file_view.h"
 #include "processing/pixel_rows.h"
 #include "processing/promote.h"
 
@@ -237,16 +237,12 @@ Status FindBitmap(std::span<const uint8_t> file, Bitmap& bitmap) {
   return bitmap.pixels == Pixels::Unknown ? Status::UnsupportedFormat : Status::Ok;
 }
 
-Status DescribePicture(std::span<const uint8_t> file, PictureRecord& picture, Bitmap& bitmap) {
-  picture.typeName.Clear();
-  RETURN_IF_BAD(FindBitmap(file, bitmap));
+Status DescribePicture(const platform::FileView& file, const ReadRequest&, Bitmap& bitmap,
+                       PictureRecord& picture) {
+  RETURN_IF_BAD(FindBitmap(file.Bytes(), bitmap));
   picture.typeName.AssignCut(bitmap.coding == WpgCoding::Runs1 ? "WordPerfect graphics, version 1"
                                                                : "WordPerfect graphics, version 2");
-  picture.width = bitmap.width;
-  picture.height = bitmap.height;
-  picture.bitsPerPixel = bitmap.Depth();
-  picture.imageBytes = EstimateImageBytes(bitmap.width, bitmap.height, picture.bitsPerPixel);
-  picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
+  SetPlainFacts(picture, bitmap.width, bitmap.height, bitmap.Depth());
   picture.palette = bitmap.palette;
   const Palette vga = VgaColors();
   const bool noMap = std::equal(vga.begin(), vga.begin() + 6, bitmap.palette.begin());
@@ -283,8 +279,12 @@ void PutRow(std::span<const uint8_t> source, const Bitmap& bitmap, std::span<uin
   }
 }
 
-Status ReadRows(platform::FileView& file, const Bitmap& bitmap, const PictureRecord& picture,
-                PackedImage& image) {
+Status Decode(platform::FileView& file, const Bitmap& bitmap, const PictureRecord& picture,
+              PackedImage& image) {
+  const uint64_t size = bitmap.RowSize() * static_cast<uint64_t>(bitmap.height);
+  if (bitmap.coding == WpgCoding::Plain && bitmap.code.size() < size) return Status::FileReadError;
+  RETURN_IF_BAD(
+      NewPackedImage(bitmap.width, bitmap.height, &picture.palette, picture.bitsPerPixel, image));
   WpgRows rows(bitmap.code, bitmap.RowSize(), bitmap.coding);
   const auto offset = static_cast<uint64_t>(bitmap.code.data() - file.Bytes().data());
   for (int32_t y = 0; y < bitmap.height; ++y) {
@@ -351,33 +351,16 @@ Status WriteRows(ByteWriter& out, const PictureRecord& picture) {
   return Status::Ok;
 }
 
+constexpr PlainCodec<Bitmap> kCodec = {UINT64_MAX, DescribePicture, Decode};
+
 }  // namespace
 
 Status WpgInfo(PictureRecord& picture, const ReadRequest& request) {
-  platform::FileView file;
-  if (!file.Open(request.fileName)) return Status::FileOpenError;
-  picture.fileSize = file.FileSize();
-  Bitmap bitmap;
-  return DescribePicture(file.Bytes(), picture, bitmap);
+  return PlainInfo(kCodec, picture, request);
 }
 
 Status WpgRead(PictureRecord& picture, const ReadRequest& request) {
-  const ProgressScope progress(picture);
-  picture.image.Free();
-  picture.alpha.Free();
-  platform::FileView file;
-  if (!file.Open(request.fileName)) return Status::FileOpenError;
-  Bitmap bitmap;
-  RETURN_IF_BAD(DescribePicture(file.Bytes(), picture, bitmap));
-  const uint64_t size = bitmap.RowSize() * static_cast<uint64_t>(bitmap.height);
-  if (bitmap.coding == WpgCoding::Plain && bitmap.code.size() < size) return Status::FileReadError;
-  PackedImage image;
-  RETURN_IF_BAD(
-      NewPackedImage(bitmap.width, bitmap.height, &picture.palette, picture.bitsPerPixel, image));
-  RETURN_IF_BAD(ReadRows(file, bitmap, picture, image));
-  if (!file.Intact()) return Status::FileReadError;
-  picture.image = std::move(image);
-  return Status::Ok;
+  return PlainRead(kCodec, picture, request);
 }
 
 Status WpgWrite(PictureRecord& picture, const WriteOptions& options) {

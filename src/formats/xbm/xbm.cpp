@@ -32,7 +32,7 @@
 #include "core/byte_writer.h"
 #include "core/limits.h"
 #include "core/text.h"
-#include "platform/file_view.h"
+#include "formats/plain_codec.h"
 #include "platform/paths.h"
 
 namespace fotomill {
@@ -233,52 +233,44 @@ class XbmValueWriter {
 };
 
 // Parses the sizes and fills the record's facts.
-Status DescribePicture(const platform::FileView& file, PictureRecord& picture) {
-  picture.typeName.Clear();
-  picture.fileSize = file.FileSize();
-  const XbmSize size = ParseSize(file.Bytes());
+Status DescribePicture(const platform::FileView& file, const ReadRequest&, XbmSize& size,
+                       PictureRecord& picture) {
+  size = ParseSize(file.Bytes());
   RETURN_IF_BAD(CheckSize(size));
-  picture.width = static_cast<int32_t>(size.width);
-  picture.height = static_cast<int32_t>(size.height);
-  picture.imageBytes = EstimateImageBytes(picture.width, picture.height, 1);
-  picture.alphaFlags = static_cast<uint8_t>(picture.alphaFlags & ~kHasAlpha);
-  MakeDefaultPalette(&picture.palette, &picture.bitsPerPixel, kBlackAndWhitePalette);
+  SetPlainFacts(picture, static_cast<int32_t>(size.width), static_cast<int32_t>(size.height), 1);
+  MakeDefaultPalette(&picture.palette, nullptr, kBlackAndWhitePalette);
   // rows of other lengths mean another thing elsewhere
   picture.simplified = picture.width % 8 != 0 || picture.height % 8 != 0;
   return Status::Ok;
 }
 
-}  // namespace
-
-Status XbmInfo(PictureRecord& picture, const ReadRequest& request) {
-  if (request.signedOnly) return Status::UnsupportedFormat;
-  platform::FileView file;
-  if (!file.OpenHead(request.fileName.c_str(), limits.textScanBytes)) return Status::FileOpenError;
-  return DescribePicture(file, picture);
-}
-
-Status XbmRead(PictureRecord& picture, const ReadRequest& request) {
-  const ProgressScope progress(picture);
-  picture.image.Free();
-  picture.alpha.Free();
-  platform::FileView file;
-  if (!file.Open(request.fileName)) return Status::FileOpenError;
-  RETURN_IF_BAD(DescribePicture(file, picture));
+Status Decode(platform::FileView& file, const XbmSize&, const PictureRecord& picture,
+              PackedImage& image) {
   XbmText text(file.Bytes());
   if (!SkipToValues(text) || text.Left() / kValueBytes < picture.imageBytes)
     return Status::DamagedFile;
-
-  PackedImage image;
-  RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette, 1, image, platform::Fill::Unset));
+  RETURN_IF_BAD(NewPackedImage(picture.width, picture.height, &picture.palette, 1, image,
+                               platform::Fill::Unset));
   for (int32_t y = 0; y < picture.height; ++y) {
     if (!DecodeRow(text, static_cast<size_t>(picture.width), image.Row(y)))
       return Status::DamagedFile;
     file.DropBefore(text.Position());
     RETURN_IF_BAD(picture.ReportRow(y));
   }
-  if (!file.Intact()) return Status::DamagedFile;
-  picture.image = std::move(image);
-  return Status::Ok;
+  return file.Intact() ? Status::Ok : Status::DamagedFile;
+}
+
+PlainCodec<XbmSize> Codec() { return {limits.textScanBytes, DescribePicture, Decode}; }
+
+}  // namespace
+
+Status XbmInfo(PictureRecord& picture, const ReadRequest& request) {
+  if (request.signedOnly) return Status::UnsupportedFormat;
+  return PlainInfo(Codec(), picture, request);
+}
+
+Status XbmRead(PictureRecord& picture, const ReadRequest& request) {
+  return PlainRead(Codec(), picture, request);
 }
 
 Status XbmWrite(PictureRecord& picture, const WriteOptions& options) {

@@ -19,4 +19,16 @@ Palette BlackAndWhite(bool blackFirst) {
   return palette;
 }
 
+BlackAndWhiteRows::BlackAndWhiteRows(const PackedImage& image, const Palette& palette, int blackBit)
+    : image_(image),
+      invert_(IsDarkFirst(palette) == (blackBit == 0) ? 0 : 0xff),
+      row_((static_cast<size_t>(image.Width()) + 7) / 8) {}
+
+std::span<uint8_t> BlackAndWhiteRows::Row(int32_t y) {
+  const auto row = image_.Row(y).first(row_.size());
+  std::ranges::transform(row, row_.begin(),
+                         [this](uint8_t byte) { return static_cast<uint8_t>(byte ^ invert_); });
+  return row_;
+}
+
 }  // namespace fotomill
