@@ -8,22 +8,22 @@
 
 namespace fotomill {
 
-// Reads a byte span front to back within its bounds. A read past the end gives 0 (or an empty
-// view), marks the reader as short and leaves it there: later reads give 0 as well. Ask Ok() once
-// per structure, and before any number that was read decides an allocation or a loop. The reader
-// does not own the bytes.
+// Reads a byte span front to back, bounds-checked. A read past the end returns 0 (or an empty
+// view) and marks the reader as short; all later reads then return 0 as well. Check Ok() once
+// per structure, and before any value read drives an allocation or a loop. The reader does not
+// own the bytes.
 class ByteReader {
  public:
   explicit ByteReader(std::span<const uint8_t> bytes) : bytes_(bytes) {}  // does not own the bytes
 
-  // Whether no read has run past the end so far; where the next read begins, and what is left of
-  // how many bytes.
+  // Whether no read has run past the end so far; the offset of the next read, the bytes left and
+  // the total.
   bool Ok() const { return !short_; }
   uint64_t Position() const { return position_; }  // bytes from the start
-  uint64_t Left() const { return bytes_.size() - position_; }  // bytes up to the end
-  uint64_t Size() const { return bytes_.size(); }  // all bytes, read or not
+  uint64_t Left() const { return bytes_.size() - position_; }  // bytes left
+  uint64_t Size() const { return bytes_.size(); }  // total bytes
 
-  // Numbers in the byte order of their name; 0 where not all of their bytes are there.
+  // Integers in the named byte order; 0 if the span ends within one.
   uint8_t U8() {
     return position_ < bytes_.size() ? bytes_[position_++] : static_cast<uint8_t>(Fail());
   }
@@ -34,8 +34,8 @@ class ByteReader {
   uint32_t Be32() { return static_cast<uint32_t>(Big(4)); }
   uint64_t Be64() { return Big(8); }
 
-  // The next `count` bytes as a view into the span; empty, and the reader short, when fewer are
-  // left.
+  // The next `count` bytes as a view into the span; empty, with the reader marked short, if fewer
+  // are left.
   std::span<const uint8_t> Take(uint64_t count) {
     if (count > Left()) {
       Fail();
@@ -45,12 +45,12 @@ class ByteReader {
     position_ += count;
     return view;
   }
-  // The next bytes without consuming them, as many as are left but at most `count`.
+  // The next bytes without consuming them: `count`, or fewer at the end.
   std::span<const uint8_t> Peek(uint64_t count) const {
     return bytes_.subspan(position_, count < Left() ? count : Left());
   }
-  void Skip(uint64_t count) { (void)Take(count); }  // beyond the end: fails as a read does
-  // Moves to an offset from the start; beyond the end the reader is short.
+  void Skip(uint64_t count) { (void)Take(count); }  // past the end: the reader is short
+  // Moves to an offset from the start; past the end, the reader is short.
   void Seek(uint64_t offset) {
     if (offset > bytes_.size()) {
       Fail();
@@ -58,7 +58,7 @@ class ByteReader {
       position_ = offset;
     }
   }
-  // Consumes `text` when it comes next; otherwise returns false and stays.
+  // Consumes `text` if it comes next; otherwise returns false without moving.
   bool Match(std::string_view text) {
     if (text.size() > Left() ||
         std::memcmp(bytes_.data() + position_, text.data(), text.size()) != 0)

@@ -1,9 +1,9 @@
 #pragma once
 
-// Sixteen bytes at a time on x86 processors that can pick bytes by a table of indices (SSSE3, in
-// all since 2008). Functions that use it are marked BYTE_SHUFFLE, are between `#ifdef BYTE_SHUFFLE`
-// lines, and run only where CanShuffleBytes() says so; a plain loop beside them does the same work
-// everywhere.
+// SIMD on 16 bytes at a time for x86 processors with byte shuffles (SSSE3,
+// in all of them since 2008). Functions that use it are marked BYTE_SHUFFLE,
+// enclosed in `#ifdef BYTE_SHUFFLE`, and called only if CanShuffleBytes(); a
+// scalar loop with the same result covers all other processors.
 #if defined(__x86_64__) || defined(__i386__)
 #include <tmmintrin.h>
 
@@ -11,7 +11,7 @@
 
 namespace fotomill {
 
-// Whether functions marked BYTE_SHUFFLE may be called on this processor.
+// Whether this processor can run functions marked BYTE_SHUFFLE.
 inline bool CanShuffleBytes() {
   static const bool can = __builtin_cpu_supports("ssse3") && __builtin_cpu_supports("popcnt");
   return can;

@@ -12,26 +12,26 @@
 
 namespace fotomill {
 
-// Writes a new file front to back. Everything gathers in one buffer that goes out in whole blocks,
-// each at a multiple of the block's size, which systems take best; larger ones gain nothing, and
-// cost much where the machine is a virtual one whose large pieces of free memory belong to its
-// host. A failed write is remembered; ask Failed() or Commit() once at the end. The file appears
-// under its name only with a successful Commit, and leaves no trace without one.
+// Writes a new file front to back. Output is buffered and written in whole blocks, aligned to the
+// block size, which is fastest on most systems. Larger blocks gain nothing, and are slow in virtual
+// machines that must first get large free memory ranges back from the host. Write errors are
+// sticky; check Failed() or Commit() once at the end. The file appears under its name only after a
+// successful Commit; otherwise nothing is left behind.
 class ByteWriter {
  public:
-  // False when the file cannot be created there (then status 10).
+  // False if the file cannot be created there (status 10).
   [[nodiscard]] bool Create(const std::string& path) {
     return buffer_.Allocate(kBufferSize, platform::Fill::Unset) && file_.Create(path);
   }
 
-  // These append at Position(), numbers in the byte order of their name, a text without a closing
-  // zero.
+  // These append at Position(): integers in the named
+  // byte order, text without a terminating NUL.
   void U8(uint8_t value) { *Room(1) = value; }
   void Le16(uint16_t value) { Little(value, 2); }  // little-endian
   void Le32(uint32_t value) { Little(value, 4); }
   void Be16(uint16_t value) { Big(value, 2); }  // big-endian
   void Be32(uint32_t value) { Big(value, 4); }
-  // Its bytes, without a closing zero.
+  // Without a terminating NUL.
   void Text(std::string_view text) {
     Bytes({reinterpret_cast<const uint8_t*>(text.data()), text.size()});
   }
@@ -42,7 +42,7 @@ class ByteWriter {
   void Bytes(std::span<const uint8_t> bytes) {
     while (!bytes.empty()) {
       while (used_ >= kBlock) FlushBlock();
-      if (used_ == 0 && bytes.size() >= kBlock) {  // whole blocks need not be copied
+      if (used_ == 0 && bytes.size() >= kBlock) {  // whole blocks are written without a copy
         Write(bytes.first(kBlock));
         bytes = bytes.subspan(kBlock);
         continue;
@@ -53,19 +53,19 @@ class ByteWriter {
       bytes = bytes.subspan(count);
     }
   }
-  // Buffer space for up to `most` bytes (at most kMostReserved), to be filled by the caller, who
-  // then says with Used() how many of them there are.
+  // Buffer space for up to `most` bytes (at most kMostReserved) for the caller to fill; Used() then
+  // sets how many were filled.
   uint8_t* Reserve(size_t most) {
     while (kBufferSize - used_ < most) FlushBlock();
     return buffer_.Data() + used_;
   }
-  void Used(size_t count) { used_ += count; }  // so many of the reserved bytes were filled
+  void Used(size_t count) { used_ += count; }  // reserved bytes that were filled
   static constexpr size_t kMostReserved = 128 * 1024;
 
   // Bytes written so far.
   uint64_t Position() const { return flushed_ + used_; }
-  // These overwrite bytes that are before Position(): what is in the file already is changed there,
-  // the rest in the buffer.
+  // Overwrites bytes before Position(): in the file if they were flushed already, else
+  // in the buffer.
   void Patch(uint64_t offset, std::span<const uint8_t> bytes) {
     if (offset < flushed_) {
       const auto inFile =
@@ -77,29 +77,29 @@ class ByteWriter {
     if (!bytes.empty())
       std::memcpy(buffer_.Data() + (offset - flushed_), bytes.data(), bytes.size());
   }
-  // At an offset that was written before.
+  // Overwrites as Patch does.
   void PatchBe32(uint64_t offset, uint32_t value) {
     const uint8_t bytes[] = {static_cast<uint8_t>(value >> 24), static_cast<uint8_t>(value >> 16),
                              static_cast<uint8_t>(value >> 8), static_cast<uint8_t>(value)};
     Patch(offset, bytes);
   }
-  // At an offset that was written before.
+  // Overwrites as Patch does.
   void PatchLe32(uint64_t offset, uint32_t value) {
     const uint8_t bytes[] = {static_cast<uint8_t>(value), static_cast<uint8_t>(value >> 8),
                              static_cast<uint8_t>(value >> 16), static_cast<uint8_t>(value >> 24)};
     Patch(offset, bytes);
   }
-  // Whether any write to the system has failed; what is written after that goes nowhere.
+  // Whether any write has failed; later output is discarded.
   bool Failed() const { return failed_; }
 
-  // Writes what is left; nothing can be added then. False when any write has failed.
+  // Flushes the buffer; nothing can be appended after that. False if any write has failed.
   [[nodiscard]] bool WriteRest() {
     while (used_ > kBlock) FlushBlock();
     if (used_ > 0) Write({buffer_.Data(), used_});
     used_ = 0;
     return !failed_;
   }
-  // Writes what is left and gives the file its name.
+  // Flushes the buffer and renames the file to its final name.
   [[nodiscard]] platform::CommitResult Commit(platform::Existing existing, bool sync = false) {
     if (!WriteRest()) {
       file_.Discard();
@@ -130,8 +130,8 @@ class ByteWriter {
     failed_ = !file_.Write(bytes) || failed_;
     flushed_ += bytes.size();
   }
-  // Writes the first block of the buffer, which holds at least one, and moves what is left to its
-  // beginning.
+  // Writes the first block of the buffer, which must hold at least one, and moves the remaining
+  // bytes to the front.
   void FlushBlock() {
     Write({buffer_.Data(), kBlock});
     used_ -= kBlock;

@@ -5,13 +5,13 @@
 
 namespace fotomill {
 
-// Arithmetic on numbers that a file claims: false when the result does not fit, and then `result`
-// is unspecified.
+// Checked arithmetic for values read from files:
+// false on overflow; `result` is then unspecified.
 template <std::integral T>
 [[nodiscard]] constexpr bool CheckedAdd(T a, T b, T& result) {
   return !__builtin_add_overflow(a, b, &result);
 }
-// False when the product overflows.
+// False if the product overflows.
 template <std::integral T>
 [[nodiscard]] constexpr bool CheckedMultiply(T a, T b, T& result) {
   return !__builtin_mul_overflow(a, b, &result);

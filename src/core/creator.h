@@ -4,8 +4,8 @@
 
 namespace fotomill {
 
-// The program's name as writers put it where a format has room for one. It is part of the files'
-// bytes and never follows the version.
+// The program's name as written to formats that record it. It is part of the file contents and does
+// not change with the version.
 inline constexpr std::string_view kCreator = "FotomillProfessional 0.00";
 
 }  // namespace fotomill

@@ -10,8 +10,8 @@ namespace fotomill {
 
 namespace {
 
-// Holds the lock file of a path, creates it before and removes it afterwards. Who waited may find
-// that the file he locked was removed meanwhile; then he begins again.
+// Holds the lock file of a path: creates it, and deletes it at the end. After waiting, the lock
+// file may turn out to be deleted already; then it starts over.
 class PathLock {
  public:
   explicit PathLock(const std::string& path) : path_(path + ".lock") {
@@ -42,7 +42,7 @@ class PathLock {
   bool held_ = false;
 };
 
-constexpr int kMostChanges = 10;  // by other programs, between reading and writing
+constexpr int kMostChanges = 10;  // by other programs, between read and write
 
 EditResult EditOnce(const std::string& path, uint64_t most,
                     const std::function<void(std::string& contents)>& edit) {
@@ -56,7 +56,7 @@ EditResult EditOnce(const std::string& path, uint64_t most,
   std::string changed = contents;
   edit(changed);
   if (changed == contents) return EditResult::Unchanged;
-  if (changed.size() > most) return EditResult::Failed;  // nobody could read it again
+  if (changed.size() > most) return EditResult::Failed;  // it could not be read again
   return platform::WriteWholeFile(path, changed) ? EditResult::Done : EditResult::Failed;
 }
 
@@ -70,7 +70,7 @@ EditResult EditTextFile(const std::string& path, uint64_t most,
     return EditResult::Failed;
   const PathLock lock(path);
   if (!lock.Held()) return EditResult::Failed;
-  platform::HeldFile file;  // an editor knows nothing of our lock
+  platform::HeldFile file;  // editors do not know our lock
   for (int tries = 0;; ++tries) {
     if (!file.Hold(path)) return EditResult::Failed;
     const EditResult result = EditOnce(path, most, edit);

@@ -6,18 +6,18 @@
 
 namespace fotomill {
 
-// What became of a change.
+// Result of EditTextFile.
 enum class EditResult {
   Done,       // the file holds the new contents
-  Unchanged,  // there was nothing to change
-  NotRead,    // the file is there and cannot be read, so it was left alone
-  Failed,     // it cannot be locked or written; it is unchanged
+  Unchanged,  // the edit changed nothing
+  NotRead,    // the file exists but cannot be read; left alone
+  Failed,     // it cannot be locked or written; left unchanged
 };
 
-// Changes a small text file that other processes may change at the same time: takes its lock
-// ("PATH.lock", which goes again), reads it afresh (empty when it is missing), lets `edit` change
-// the contents, and replaces the file in one step unless they stayed the same. The folder is made
-// when it is missing. Files over `most` bytes are not read.
+// Changes a small text file that other processes may change at the same time: locks it
+// ("PATH.lock", removed afterwards), reads it (a missing file is empty), has `edit` change the
+// contents, and replaces the file atomically if they changed. Creates the folder if it is missing.
+// Files over `most` bytes are not read.
 EditResult EditTextFile(const std::string& path, uint64_t most,
                         const std::function<void(std::string& contents)>& edit);
 

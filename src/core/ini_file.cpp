@@ -9,16 +9,16 @@ namespace fotomill {
 
 namespace {
 
-// Windows editors put it in front of UTF-8
+// Windows editors write it before UTF-8
 constexpr std::string_view kByteOrderMark = "\xEF\xBB\xBF";
 constexpr std::string_view kBlanks = " \t";
 
 struct Line {
-  std::string_view text;  // without its end
-  std::string_view end;   // "\n", "\r\n"; at the end of the file also "\r" or nothing
+  std::string_view text;  // without the line ending
+  std::string_view end;   // "\n" or "\r\n"; at the end of the file also "\r" or empty
 };
 
-// Takes the next line off the text.
+// Removes the first line from the text.
 Line TakeLine(std::string_view& rest) {
   const size_t feed = rest.find('\n');
   const size_t size = feed == std::string_view::npos ? rest.size() : feed + 1;
@@ -35,7 +35,7 @@ std::string_view TrimBlanks(std::string_view text) {
   return text.substr(first, text.find_last_not_of(kBlanks) + 1 - first);
 }
 
-// The name of a section line, nullopt for other lines.
+// The section name of a section line, nullopt for other lines.
 std::optional<std::string_view> SectionOf(std::string_view line) {
   line = TrimBlanks(line.starts_with(kByteOrderMark) ? line.substr(kByteOrderMark.size()) : line);
   const size_t close = line.find(']');
@@ -43,7 +43,7 @@ std::optional<std::string_view> SectionOf(std::string_view line) {
   return line.substr(1, close - 1);
 }
 
-// The entry of a line, false for comments and other lines.
+// The entry on a line; false for comments and other lines.
 bool EntryOf(std::string_view line, IniEntry& entry) {
   const size_t equals = line.find('=');
   if (equals == std::string_view::npos) return false;
@@ -52,7 +52,7 @@ bool EntryOf(std::string_view line, IniEntry& entry) {
   return !entry.key.empty() && entry.key.front() != ';' && entry.key.front() != '#';
 }
 
-// Copies the text line by line and makes the changes on the way.
+// Copies the text line by line, applying the changes.
 class IniEditor {
  public:
   IniEditor(std::string_view section, std::span<const IniEdit> edits)
@@ -93,7 +93,7 @@ class IniEditor {
       out_.append(line.text.data(), entry.value.data());
       out_ += *edit.value;
       out_ += line.end;
-      open_.erase(found);  // further lines of that key do not count and stay
+      open_.erase(found);  // later lines of that key are ignored by readers and kept
     }
   }
 
@@ -102,8 +102,8 @@ class IniEditor {
     out_ += line.end;
   }
 
-  // New keys come behind the last entry of the section's first part, before comments that may
-  // belong to the next one.
+  // New keys are inserted after the last entry of the section's first part, before comments that
+  // may belong to the next section.
   void RememberPlace() {
     place_ = lastEntry_;
     placeFound_ = true;
@@ -131,7 +131,7 @@ class IniEditor {
 
   std::string_view section_;
   std::span<const IniEdit> edits_;
-  std::unordered_map<std::string_view, const IniEdit*> open_;  // changes not yet made
+  std::unordered_map<std::string_view, const IniEdit*> open_;  // pending changes
   std::string out_;
   std::string_view lineEnd_;
   bool inside_ = false;

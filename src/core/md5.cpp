@@ -15,7 +15,7 @@ constexpr unsigned kFirstWord[4] = {0, 1, 5, 0}, kWordStep[4] = {1, 5, 3, 7};
 
 using State = std::array<uint32_t, 4>;
 
-// Step i adds the whole part of 2^32 x |sin(i + 1)|.
+// Step i adds the integer part of 2^32 x |sin(i + 1)|.
 const std::array<uint32_t, 64>& Sines() {
   static const std::array<uint32_t, 64> sines = [] {
     std::array<uint32_t, 64> made{};

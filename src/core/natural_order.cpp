@@ -10,7 +10,7 @@ namespace {
 
 bool IsDigit(char c) { return c >= '0' && c <= '9'; }
 
-// The run of digits at `from`, without leading zeros; `from` moves behind it.
+// The run of digits at `from`, without leading zeros; advances `from` past it.
 std::string_view TakeNumber(std::string_view text, size_t& from) {
   size_t end = from;
   while (end < text.size() && IsDigit(text[end])) ++end;
@@ -25,7 +25,7 @@ int CompareNumbers(std::string_view a, std::string_view b) {
   return a.compare(b);
 }
 
-// Wildcards, without going back further than the last star.
+// Wildcard match, backtracking to the last star only.
 bool MatchesPattern(std::string_view text, std::string_view pattern) {
   size_t t = 0, p = 0, star = std::string_view::npos, resume = 0;
   while (t < text.size()) {

@@ -10,10 +10,10 @@ namespace fotomill {
 
 namespace {
 
-// longer texts are not typing errors, and the table below stays small
+// longer texts are not typos, and the table below stays small
 constexpr size_t kLongestName = 64;
 
-// Number of characters to change, insert, delete or swap with their neighbour to turn `a` into `b`.
+// Edit distance: characters to change, insert, delete or swap with a neighbor to turn `a` into `b`.
 size_t EditDistance(std::string_view a, std::string_view b) {
   std::vector<size_t> beforeLast(b.size() + 1), last(b.size() + 1), row(b.size() + 1);
   for (size_t j = 0; j <= b.size(); ++j) last[j] = j;
@@ -32,7 +32,7 @@ size_t EditDistance(std::string_view a, std::string_view b) {
   return last[b.size()];
 }
 
-// The name whose distance is below `fewest` and smallest, with at least one character in place.
+// The closest name with a distance below `fewest` and at least one character in place.
 std::string_view NearestBelow(size_t fewest, std::string_view typed,
                               std::span<const std::string_view> names) {
   std::string_view nearest;

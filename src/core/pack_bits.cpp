@@ -51,7 +51,7 @@ bool UnpackBits(std::span<const uint8_t>& code, std::span<uint8_t> row) {
 
 size_t PackBits(std::span<const uint8_t> row, uint8_t* code) {
   uint8_t* out = code;
-  size_t at = 0, literals = 0;  // bytes before `at` that stand as they are
+  size_t at = 0, literals = 0;  // length of the literal run before `at`
   const auto flush = [&] {
     if (literals == 0) return;
     *out++ = static_cast<uint8_t>(literals - 1);

@@ -6,19 +6,19 @@
 
 namespace fotomill {
 
-// PackBits, which Amiga IFF calls ByteRun1: a byte n below 128 is before n + 1 bytes as they are,
-// one above 128 before a byte that is repeated 257 - n times, and 128 means nothing. Source: Apple
+// PackBits, called ByteRun1 in Amiga IFF: a code byte n below 128 precedes n + 1 literal bytes, one
+// above 128 precedes a byte that is repeated 257 - n times, and 128 is a no-op. Source: Apple
 // Computer, Macintosh Technical Note 1023, "Understanding PackBits" (1996).
 
-// Unpacks bytes into the whole of `row`; what would go beyond it is dropped. `code` becomes what is
-// left of it. False when the code ends before the row does; the rest of the row then stays as it
-// is.
+// Unpacks until `row` is full; a run that goes past its end is
+// cut. `code` becomes the remaining code. False if the code
+// ends before the row; the rest of the row is then unchanged.
 [[nodiscard]] bool UnpackBits(std::span<const uint8_t>& code, std::span<uint8_t> row);
 
-// The most bytes that `size` bytes are packed to.
+// The maximum packed size of `size` bytes.
 constexpr size_t MostPackedBits(size_t size) { return size + (size + 127) / 128; }
-// Packs a row into `code`, which has room for MostPackedBits bytes; the number of bytes. Runs of
-// two cost nothing and are packed only where no bytes stand as they are before them.
+// Packs a row into `code`, which must have room for MostPackedBits bytes; returns the packed size.
+// Runs of two are packed only where they do not interrupt a literal run.
 size_t PackBits(std::span<const uint8_t> row, uint8_t* code);
 
 }  // namespace fotomill

@@ -4,8 +4,8 @@
 
 namespace fotomill {
 
-// Whether a text may become a file name, or a part of one, without leading to another folder: no
-// "/", "\", "..", zero byte or control character; on Windows no ":" either. An empty text is plain.
+// Whether a text is safe as a file name or part of one: no "/", "\", "..", NUL or control
+// character, and on Windows no ":". An empty text is safe.
 bool IsPlainName(std::string_view text);
 
 }  // namespace fotomill

@@ -5,10 +5,10 @@
 
 namespace fotomill {
 
-// Texts and names from files may hold anything; these make them fit to be shown.
+// Texts and names from files may contain anything; these make them safe to display.
 
-// Control characters (below 0x20, 0x7F, U+0080 to U+009F) and bytes that are not UTF-8 written as
-// \n, \t, \r or \xNN, so that no text can steer a terminal or break a line. Everything else stays.
+// Escapes control characters (below 0x20, 0x7F, U+0080 to U+009F) and invalid UTF-8 as \n, \t, \r
+// or \xNN, so that no text can send terminal escapes or break a line.
 std::string EscapeControls(std::string_view text);
 
 }  // namespace fotomill

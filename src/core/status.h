@@ -5,18 +5,18 @@
 
 namespace fotomill {
 
-// Outcome of every codec, registry and batch operation. The number indexes the user message table.
+// Result of every codec, registry and batch operation. The number indexes the user message table.
 enum class [[nodiscard]] Status : int32_t{
 #define STATUS(number, name, message) name = number,
 #include "core/status.def"
 #undef STATUS
 };
 
-// The number that JSON, plug-ins and the manual know a status by.
+// The number of a status in JSON, the plug-in interface and the manual.
 constexpr int32_t StatusNumber(Status status) { return static_cast<int32_t>(status); }
 
-// The user message of a status, "Ok" for success; numbers outside the table (a plug-in may return
-// any) give an empty text.
+// The user message of a status, "Ok" for success; empty for numbers outside the table, which
+// plug-ins may return.
 constexpr std::string_view StatusMessage(Status status) {
   switch (status) {
 #define STATUS(number, name, message) \
@@ -28,7 +28,7 @@ constexpr std::string_view StatusMessage(Status status) {
   return {};
 }
 
-// Passes any status but Ok on to the caller.
+// Returns any status but Ok to the caller.
 #define RETURN_IF_BAD(expression)                                                           \
   do {                                                                                      \
     if (const ::fotomill::Status status_ = (expression); status_ != ::fotomill::Status::Ok) \

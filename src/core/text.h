@@ -6,7 +6,7 @@
 
 namespace fotomill {
 
-// Case of ASCII letters only: extensions and keywords, whatever the user's language.
+// ASCII-only case, for extensions and keywords, independent of the locale.
 constexpr char LowerCase(char c) {
   return c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c;
 }
@@ -15,10 +15,10 @@ constexpr char UpperCase(char c) {
 }
 // A to Z and a to z only.
 constexpr bool IsLetter(char c) { return LowerCase(c) >= 'a' && LowerCase(c) <= 'z'; }
-std::string LowerCase(std::string_view text);  // other bytes stay
-std::string UpperCase(std::string_view text);  // other bytes stay
+std::string LowerCase(std::string_view text);  // ASCII only
+std::string UpperCase(std::string_view text);  // ASCII only
 
-// Compares with the case of A to Z ignored; other letters and bytes have to be the same.
+// Compares ignoring the case of A to Z; all other bytes must be equal.
 constexpr bool EqualIgnoringCase(std::string_view a, std::string_view b) {
   if (a.size() != b.size()) return false;
   for (size_t i = 0; i < a.size(); ++i) {
@@ -27,15 +27,15 @@ constexpr bool EqualIgnoringCase(std::string_view a, std::string_view b) {
   return true;
 }
 
-// The whole number that a text begins with: white space, a sign, decimal digits; whatever follows
-// is ignored. 0 without a digit; a number beyond 64 bits gives the nearest one that fits.
+// The integer at the start of a text: white space, a sign, decimal digits; anything after it is
+// ignored. 0 without a digit; clamped to 64 bits.
 int64_t LeadingInteger(std::string_view text);
 
-// Item `index`, from 0, of a list whose items are separated by ";"; "Unknown" for an index that the
-// list does not have.
+// Item `index`, from 0, of a ";"-separated
+// list; "Unknown" if the index is out of range.
 std::string_view ListItem(std::string_view list, int64_t index);
 
-// A number in decimal with a comma between every group of three digits.
+// A decimal number with commas as thousands separators.
 std::string WithThousands(uint64_t number);
 
 }  // namespace fotomill

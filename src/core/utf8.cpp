@@ -19,7 +19,7 @@ size_t CharacterLength(std::string_view text) {
   const uint8_t first = ByteAt(text, 0);
   if (first < 0x80) return 1;
   size_t length = 0;
-  // of the second byte: neither too long a form, nor a surrogate, nor too large
+  // of the second byte: rules out overlong forms, surrogates and values beyond U+10FFFF
   uint8_t lowest = 0x80, highest = 0xBF;
   if (first >= 0xC2 && first <= 0xDF) {
     length = 2;

@@ -9,8 +9,8 @@
 
 namespace fotomill {
 
-// The decimal number at the start of a text, which is taken off it; blanks before it and a sign are
-// allowed. nullopt, and the text as it was, if there is none or it does not fit.
+// Parses and removes the decimal number at the start of a text, with optional blanks and a sign.
+// nullopt, with the text unchanged, if there is no number or it overflows.
 template <std::integral T = int32_t>
 std::optional<T> TakeNumber(std::string_view& text) {
   std::string_view rest = text.substr(std::min(text.find_first_not_of(" \t"), text.size()));
@@ -23,7 +23,7 @@ std::optional<T> TakeNumber(std::string_view& text) {
   return number;
 }
 
-// A text that is a decimal number, blanks around it allowed; nullopt for anything else.
+// A text that is exactly one decimal number, optionally surrounded by blanks; else nullopt.
 template <std::integral T = int32_t>
 std::optional<T> ParseNumber(std::string_view text) {
   const std::optional<T> number = TakeNumber<T>(text);

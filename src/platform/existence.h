@@ -4,13 +4,13 @@
 
 namespace fotomill::platform {
 
-// Whether a name is taken. Unknown: the system does not tell, as in a folder that may not be
-// searched; who takes that for No overwrites, and who takes it for Yes looks for a free name
-// forever.
+// Whether a name is taken. Unknown if the system cannot say, as in a folder without search
+// permission. Treating that as No would overwrite files; treating it as Yes would search for a free
+// name forever.
 enum class Existence { No, Yes, Unknown };
 
-// Whether there is anything of that name, a dangling link included. Unknown keeps the system's
-// reason.
+// Whether anything has that name, including a dangling link. For Unknown, the system's
+// reason is kept.
 Existence ExistenceOf(const std::string& path);
 
 }  // namespace fotomill::platform

@@ -13,77 +13,77 @@ namespace fotomill::platform {
 // Other: FIFO, device, socket, dangling link
 enum class FileKind { Missing, Regular, Folder, Other };
 
-// What the system tells of a file. Times are seconds since 1970-01-01 UTC.
+// File metadata. Times are seconds since 1970-01-01 UTC.
 struct FileFacts {
   FileKind kind = FileKind::Missing;
   uint64_t size = 0;
   int64_t modified = 0;
-  // the birth time where the file system keeps one, else the modification time
+  // birth time if the file system stores it, else modification time
   int64_t created = 0;
   bool link = false;                  // the name itself is a symbolic link
-  uint64_t device = 0, identity = 0;  // together they name the file itself, whatever its path
+  uint64_t device = 0, identity = 0;  // together they identify the file, whatever its path
 };
 
-// Facts of the file that `path` leads to, through links. Missing is a kind, not an error. What
-// cannot be asked (a folder on the way may not be searched) is Other: no one may take it for free.
+// Facts of the file that `path` refers to, following links. Missing is a kind, not an error. Other
+// if it cannot be determined (no permission to search a folder), so the name is not taken for free.
 FileFacts FactsOf(const std::string& path);
-bool FileExists(const std::string& path);  // anything of that name, a dangling link included
+bool FileExists(const std::string& path);  // anything with that name, including a dangling link
 bool IsRegularFile(const std::string& path);  // links are followed
 bool IsFolder(const std::string& path);  // links are followed
 
-// Names in a folder, without "." and "..", in byte order. nullopt when it cannot be read.
+// Names in a folder, without "." and "..", in byte order. nullopt if it cannot be read.
 struct FolderEntry {
   std::string name;
-  FileKind kind;  // of a link: what it leads to, Other when that is nothing
-  bool link;      // the entry is a symbolic link; who walks down folders does not follow these
+  FileKind kind;  // of a link: its target's, Other if dangling
+  bool link;      // the entry is a symbolic link; not followed when descending into folders
 };
-// Reads the whole folder; links are followed once to tell their kind.
+// Reads the whole folder; links are resolved once for their kind.
 std::optional<std::vector<FolderEntry>> ListFolder(const std::string& path);
-// Makes a folder with its parents; true when it is there afterwards.
+// Creates a folder with its parents; true if it exists afterwards.
 [[nodiscard]] bool MakeFolders(const std::string& path);
 
-// Deletes one file, never a folder. A path's final link is deleted itself.
+// Deletes one file, never a folder. A symbolic link is deleted, not its target.
 [[nodiscard]] bool DeleteFile(const std::string& path);
-// Deletes a folder that is empty.
+// Deletes an empty folder.
 [[nodiscard]] bool DeleteFolder(const std::string& path);
-// Renames within one file system. A destination that is there and neither a regular file nor a link
-// stays: Failed. Where case does not count, a name may be changed to itself in other case.
+// Renames within one file system. Failed if the destination is neither a regular file nor a link.
+// On case-insensitive file systems, the case of a name may be changed.
 [[nodiscard]] CommitResult RenameFile(const std::string& from, const std::string& to,
                                       Existing existing);
-// Moves a file, folder or link into the system's trash, from which its user can bring it back.
-// False if there is none for it; nothing has happened then.
+// Moves a file, folder or link into the system's trash, from which the user can restore it. False
+// if there is no trash for it; nothing is changed then.
 [[nodiscard]] bool MoveToTrash(const std::string& path);
-// Brings back what MoveToTrash took away from that path last. False when it is not in the trash any
-// more, or when the path is taken.
+// Restores what MoveToTrash last removed from that path. False if it is no longer in the trash, or
+// if the path is taken.
 [[nodiscard]] bool RestoreFromTrash(const std::string& path);
-// Whether MoveToTrash can work for that path, without doing it.
+// Whether MoveToTrash can work for that path, without trying it.
 bool HasTrash(const std::string& path);
 
-// The attribute that keeps a file out of listings. Where hidden is what begins with a dot,
-// SetHidden answers true and changes nothing.
+// Sets or clears the hidden attribute. On systems that hide files by a leading dot, SetHidden
+// returns true and changes nothing.
 [[nodiscard]] bool SetHidden(const std::string& path, bool hidden);
-bool IsHidden(const std::string& path);  // a leading dot, or the system's attribute
-// Clears hidden and read-only.
+bool IsHidden(const std::string& path);  // a leading dot, or the hidden attribute
+// Clears the hidden and read-only attributes.
 [[nodiscard]] bool SetNormal(const std::string& path);
-// A file's modification time, as finely as the system keeps it.
+// A file's modification time, in the file system's resolution.
 struct ExactTime {
   int64_t seconds = 0;
   int64_t nanoseconds = 0;
 };
-// Of the file that a path leads to, through links. nullopt and false when it is not there or not
-// ours to change.
+// Of the file that a path refers to, following links. nullopt or false if it does not exist or
+// permission is denied.
 std::optional<ExactTime> ModificationTime(const std::string& path);
-// False when the system refuses.
+// False if the system refuses.
 [[nodiscard]] bool SetModificationTime(const std::string& path, ExactTime time);
-// Gives a file the modification time of another, as finely as the system keeps it.
+// Copies a file's modification time to another file, in the file system's resolution.
 [[nodiscard]] bool CopyTimes(const std::string& from, const std::string& to);
 
-// A small whole file, at most `most` bytes. Missing and unreadable are told apart: who would
-// overwrite a file that it could not read loses it. A link that leads nowhere has failed.
-// `contents` is empty unless Done.
+// Reads a small file, at most `most` bytes. Missing and Failed are
+// distinct, so that callers do not overwrite a file they could not
+// read. A dangling link is Failed. `contents` is empty unless Done.
 enum class ReadResult { Done, Missing, Failed, TooLarge };
 ReadResult ReadWholeFile(const std::string& path, uint64_t most, std::string& contents);
-// Replaces a file's contents in one step, synced. False leaves the old file unchanged.
+// Replaces a file's contents atomically, synced. On false, the old file is unchanged.
 [[nodiscard]] bool WriteWholeFile(const std::string& path, std::string_view contents);
 
 }  // namespace fotomill::platform

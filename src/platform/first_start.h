@@ -7,39 +7,39 @@
 
 namespace fotomill::platform {
 
-// A later start that hands its message over and waits for it to be taken. Goes with its last owner.
+// A later instance that passes on its message and waits for a reply. Ended with its last owner.
 class LaterStart {
  public:
   virtual ~LaterStart() = default;
-  // What the later start was given, byte for byte.
+  // The message of the later instance, byte for byte.
   virtual const std::string& Message() const = 0;
-  // Lets the later start end. False when it has given up waiting: it continues by itself, and its
-  // message is to be dropped.
+  // Lets the later instance exit. False if it has timed out: it continues by itself, and its
+  // message must be ignored.
   virtual bool Accept() = 0;
 };
 
-// Has one running program of the user stand for all those of a name: later starts hand over what
-// they were started with. What an earlier program left behind when it was killed, one that hangs,
-// and files of other users never are in the way.
+// Single instance per user and name: later instances pass
+// their message to the first. Leftovers of a killed instance,
+// a hanging one, and files of other users never block it.
 class FirstStart {
  public:
-  // Which of the programs of a name this one is.
+  // The role of this instance.
   enum class Standing {
     First,       // the only one so far
-    HandedOver,  // another one has taken the message
-    // the other one did not answer in time, or the system has no place for this: this one continues
-    // by itself
+    HandedOver,  // another instance has taken the message
+    // the other instance did not answer in time, or the system has no suitable folder: this one
+    // continues by itself
     Alone,
   };
 
   FirstStart();
   FirstStart(const FirstStart&) = delete;
   FirstStart& operator=(const FirstStart&) = delete;
-  ~FirstStart();  // leaves the place to others, and waits for the thread that listens
+  ~FirstStart();  // gives up the role, and waits for the listening thread
 
-  // `name` of letters and digits. Waits for an answer for so many seconds at most.
+  // `name` consists of letters and digits. Waits at most `seconds` for an answer.
   [[nodiscard]] Standing Begin(const std::string& name, const std::string& message, double seconds);
-  // For the first one: calls `came` on a thread of its own for every later start from here on.
+  // For the first instance: calls `came` on a separate thread for every later instance.
   void Listen(std::function<void(std::shared_ptr<LaterStart> start)> came);
 
  private:

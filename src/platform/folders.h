@@ -5,31 +5,31 @@
 
 namespace fotomill::platform {
 
-// The user's folders; each is a path without a closing separator, or empty when the system has
-// none.
+// The user's folders; each is a path without a
+// trailing separator, or empty if the system has none.
 enum class SpecialFolder {
   // $XDG_CONFIG_HOME, else ~/.config; on Windows the roaming application data (CSIDL 26)
   ApplicationData,
   Cache,            // $XDG_CACHE_HOME, else ~/.cache
   Home,
-  // as the user named it (user-dirs.dirs), else ~/Pictures if there is one, else the home folder
+  // from user-dirs.dirs, else ~/Pictures if it exists, else the home folder
   Pictures,
   Documents,  // likewise
-  Temporary,  // $TMPDIR where it is a folder, else /tmp
+  Temporary,  // $TMPDIR if it is a folder, else /tmp
 };
-// Asks the environment and the system each time; the folder need not be there.
+// Queries the environment and the system each time; the folder may not exist.
 std::string SpecialFolderPath(SpecialFolder folder);
 
-// The user's full name as the system knows it, else the login name; empty when it knows neither.
+// The user's full name, else the login name; empty if the system knows neither.
 std::string UserFullName();
 
-// The running program's own file and its folder, links resolved.
+// Path of the running program, links resolved.
 std::string ProgramPath();
-std::string ProgramFolder();  // the folder of the running program's file
+std::string ProgramFolder();  // folder of the running program
 std::string CurrentFolder();  // absolute
-// A relative path made absolute against the current folder, with "." and ".." taken out and no
-// closing separator; links stay. Without a current folder (it was deleted) a relative path comes
-// back as it is.
+// Makes a relative path absolute against the current folder, and removes ".", ".." and a
+// trailing separator; links are not resolved. If the current folder was deleted, a relative path
+// is returned unchanged.
 std::string AbsolutePath(const std::string& path);
 
 }  // namespace fotomill::platform

@@ -5,9 +5,9 @@
 
 namespace fotomill::platform {
 
-// Called once for each lock that was waited for two seconds, on the thread that waits, with the
-// file's path and who holds the lock: "fotomill (process 123)", or "another program" where the
-// system does not tell. After ten seconds the lock is given up. Set before threads begin.
+// Called once for each lock after two seconds of waiting, on the waiting thread, with the file's
+// path and the lock's holder: "fotomill (process 123)", or "another program" if unknown. After ten
+// seconds the wait fails. Must be set before threads are started.
 extern std::function<void(const std::string& path, const std::string& holder)> onLongLockWait;
 
 }  // namespace fotomill::platform

@@ -8,12 +8,12 @@
 
 namespace fotomill::platform {
 
-// How a new block's bytes start. `Unset` is for owners that write every byte before anyone reads
-// one.
+// Initial contents of a block. `Unset` is for
+// owners that write every byte before reading any.
 enum class Fill { Zero, Unset };
 
-// A movable block of memory that its holder owns. Large blocks come from a process-wide pool, so
-// that a batch pays for fresh pages once, and ask for huge pages.
+// A movable block of memory, owned by its holder. Large blocks come from a process-wide pool, so
+// that a batch pays for fresh pages only once, and use huge pages.
 class MemoryBlock {
  public:
   MemoryBlock() = default;
@@ -26,14 +26,14 @@ class MemoryBlock {
   MemoryBlock& operator=(const MemoryBlock&) = delete;
   ~MemoryBlock() { Free(); }
 
-  // Replaces the block by one of `size` bytes. False, with the block empty, if there is no memory.
+  // Replaces the block with one of `size` bytes. False, with the block empty, if memory runs out.
   [[nodiscard]] bool Allocate(uint64_t size, Fill fill = Fill::Zero);
-  // Grows or shrinks, keeping the contents up to the smaller size; new bytes are zero. False leaves
-  // the block unchanged.
+  // Grows or shrinks, keeping the contents up to the smaller size; new bytes are zero. On false,
+  // the block is unchanged.
   [[nodiscard]] bool Resize(uint64_t size);
-  void Free();  // into the pool, or back to the system
+  void Free();  // returns it to the pool or the system
 
-  // The block as it is: null and of size 0 when nothing is allocated. Pointers and spans hold until
+  // Accessors; null and size 0 when nothing is allocated. Pointers and spans are valid until
   // Allocate, Resize or Free.
   bool Empty() const { return data_ == nullptr; }
   uint64_t Size() const { return size_; }  // bytes, 0 without a block
@@ -41,7 +41,7 @@ class MemoryBlock {
   const uint8_t* Data() const { return data_; }
   std::span<uint8_t> Bytes() { return {data_, static_cast<size_t>(size_)}; }
   std::span<const uint8_t> Bytes() const { return {data_, static_cast<size_t>(size_)}; }
-  // The bytes as an array of plain numbers or structures of them.
+  // The bytes as an array of a trivial type.
   template <typename T>
   std::span<T> Items() {
     static_assert(std::is_trivially_copyable_v<T> && std::is_trivially_destructible_v<T>);
@@ -51,15 +51,15 @@ class MemoryBlock {
  private:
   uint8_t* data_ = nullptr;
   uint64_t size_ = 0;
-  uint64_t capacity_ = 0;  // bytes really reserved: size_ rounded up to what the pool deals in
+  uint64_t capacity_ = 0;  // bytes reserved: size_ rounded up to the pool's unit
 };
 
-// From here on freed blocks below the pool's size stay with the process instead of going back to
-// the system each time the last one is freed: a batch of small pictures then pays for fresh pages
-// once. For programs that end with their work.
+// From now on, freed blocks below the pool's size stay with the process instead of being returned
+// to the system one by one: a batch of small pictures then pays for fresh pages only once. For
+// programs that exit when their work is done.
 void KeepFreedMemory();
 
-// Gives the pool's unused blocks back to the system.
+// Returns the pool's unused blocks to the system.
 void TrimMemoryPool();
 
 }  // namespace fotomill::platform

@@ -4,17 +4,17 @@
 
 namespace fotomill::platform {
 
-// What happens when the code of a module ends the program, by a crash or by calling exit().
+// What to do if a module's code ends the program, by a crash or by calling exit().
 struct ModuleRisk {
-  std::string message;     // for the standard error
-  std::string recordFile;  // gets `record` as a line of its own; empty: nothing is recorded
+  std::string message;     // for standard error
+  std::string recordFile;  // gets `record` as a new line; empty: not recorded
   std::string record;
 };
 
-// Marks this thread as running the code of a module, from here to the end of the guard's life. If
-// the module crashes or calls exit() meanwhile, the message is printed, temporary files are
-// deleted, and the program ends with the signal's status or 1, never with success. A module that
-// calls _exit() gets away. Guards of one thread may be nested: the last one counts.
+// Marks this thread as running a module's code, for the lifetime of the guard. If the module
+// crashes or calls exit() meanwhile, the message is printed, temporary files are deleted, and the
+// program exits with the signal's status or 1, never with success. _exit() is not caught. Guards of
+// one thread may be nested: the innermost applies.
 class ModuleGuard {
  public:
   explicit ModuleGuard(ModuleRisk risk);
@@ -27,7 +27,7 @@ class ModuleGuard {
   const ModuleRisk* before_;
 };
 
-// Takes the mark from this thread while a module has called back into the program.
+// Suspends the guard of this thread while a module calls back into the program.
 class OwnCode {
  public:
   OwnCode();

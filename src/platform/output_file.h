@@ -6,23 +6,23 @@
 
 namespace fotomill::platform {
 
-// What Commit does about a file that already has the destination's name.
+// What Commit does if the destination exists.
 enum class Existing {
-  Replace,  // take its place in one step; the old file's contents stay until then
-  Refuse,   // fail, and leave it alone
+  Replace,  // replace it atomically; the old contents stay until then
+  Refuse,   // fail, leaving it unchanged
 };
 
-// What became of giving a file its name.
+// Result of Commit.
 enum class CommitResult {
   Done,
-  Taken,   // Existing::Refuse, and the name was taken meanwhile
-  Failed,  // a write, or giving the file its name, failed
+  Taken,   // Existing::Refuse, and the name exists by now
+  Failed,  // a write or the rename failed
 };
 
-// A file that appears under its name only when it is whole: bytes go to a sibling without a name,
-// or with a temporary one where the file system knows no other, which Commit turns into the file.
-// Without a Commit the sibling goes and nothing has changed, even when the program is killed. A
-// file that takes another's place takes over its permissions.
+// A file that appears under its name only when it is complete. Bytes go to an unnamed temporary
+// file in the same folder (on file systems without these, one with a temporary name), which Commit
+// renames. Without a Commit it is deleted and nothing has changed, even if the program is killed. A
+// file that replaces another takes over its permissions.
 class OutputFile {
  public:
   OutputFile() = default;
@@ -30,19 +30,19 @@ class OutputFile {
   OutputFile& operator=(const OutputFile&) = delete;
   ~OutputFile() { Discard(); }
 
-  // Creates the sibling of `path`. False when the folder is missing or not writable, or when `path`
-  // is there and is not a regular file or is write-protected (a symbolic link counts as a file of
-  // its own and would be replaced, never followed).
+  // Creates the temporary file for `path`. False if the folder is missing or not writable, or if
+  // `path` exists and is not a regular file or is write-protected (a symbolic link counts as a file
+  // and would be replaced, never followed).
   [[nodiscard]] bool Create(const std::string& path);
-  // False once any write has failed.
+  // False if this or any earlier write has failed.
   bool Write(std::span<const uint8_t> bytes);
-  // Overwrites bytes that were written before.
+  // Overwrites bytes written earlier.
   bool WriteAt(uint64_t offset, std::span<const uint8_t> bytes);
-  // Gives the file its name. `sync` asks the system to have the contents on disk first; a file that
-  // replaces another is always synced. After anything but Done there is no new file; Commit cannot
-  // be tried again.
+  // Renames the file to its name. `sync` flushes the contents to disk first; a file that
+  // replaces another is always synced. On any result but Done there is no new file, and Commit
+  // cannot be retried.
   [[nodiscard]] CommitResult Commit(Existing existing, bool sync = false);
-  void Discard();  // deletes what was written; the destination stays unchanged
+  void Discard();  // deletes the temporary file; the destination is unchanged
 
  private:
   bool CreateNamedSibling(unsigned mode);
@@ -51,14 +51,14 @@ class OutputFile {
   CommitResult TakeName(Existing existing, bool replaces, bool& synced);
 
   std::string path_;
-  std::string temporary_;  // the sibling's name, empty while it has none
+  std::string temporary_;  // the temporary name, empty if there is none
   int handle_ = -1;
-  int listed_ = -1;  // the name's number among those that go when the program is ended at once
+  int listed_ = -1;  // slot of the name in the list of files to delete if the program is killed
   bool failed_ = false;
 };
 
-// Whether a file of that name could be made now, with those folders of its path that are missing.
-// False keeps the system's reason. For runs that only tell what they would do.
+// Whether a file could be created under that name, along with missing folders of its path. For dry
+// runs. On false, the system's reason is kept.
 bool MayCreate(const std::string& path);
 
 }  // namespace fotomill::platform

@@ -5,40 +5,40 @@
 
 namespace fotomill::platform {
 
-// The program registered for a file, as an argument vector that opens it; empty if there is none.
+// The default program for a file, as an argument vector to open it; empty if there is none.
 std::vector<std::string> ProgramFor(const std::string& file);
-// Starts a program with its arguments, without a shell. A name without separator is looked up in
-// the absolute folders of PATH, never in the current one. `wait` blocks until it has ended; without
-// it the program lives on its own, away from this one's terminal input, output and Ctrl-C. False
-// when it cannot start.
+// Starts a program without a shell. A name without separator is looked up
+// in the absolute folders of PATH, never in the current folder. `wait`
+// blocks until it exits; otherwise it is detached from this program's
+// terminal input, output and Ctrl-C. False if it cannot be started.
 [[nodiscard]] bool RunProgram(const std::vector<std::string>& arguments, bool wait);
 
-// Gives the standard streams that the program was started without a place that holds nothing and
-// takes nothing; a file that is opened later would else stand in for one of them, and get its
-// messages. Before anything is opened.
+// Opens the null device for closed standard streams;
+// otherwise a file opened later would take the place of one
+// and receive its messages. Call before opening anything.
 void FillStandardStreams();
 bool IsTerminal(int stream);  // 0 standard input, 1 output, 2 error
-// Whether no one reads what is written to a stream any more: a pipe whose other end is closed.
+// Whether writing to a stream is pointless: a pipe with its read end closed.
 bool IsReaderGone(int stream);
-bool IsStored(int stream);    // goes to a regular file: no one waits for what is written
-// Waits until the standard input has something to read, or has ended. False when the program was
-// asked to end meanwhile.
+bool IsStored(int stream);    // redirected to a regular file, so no one is waiting for output
+// Waits until standard input has data or has ended. False if the program was asked
+// to end meanwhile.
 bool WaitForInput();
-// Whether what is typed on the terminal of the standard input shows up there. False if there is no
-// such terminal.
+// Switches terminal echo for standard input.
+// False if it is not a terminal.
 bool ShowTyping(bool show);
-// Gives an environment variable a value, for this program and those that it starts. Before other
-// threads run.
+// Sets an environment variable for this program and its child processes. Call
+// before starting threads.
 void SetVariable(const char* name, const std::string& value);
 int TerminalWidth();   // columns, 80 when unknown
 unsigned CoreCount();  // cores this process may use, at least 1
 
-// From here on Ctrl-C and the system's request to end are remembered instead of ending the program
-// at once, and `PendingExit` returns the exit status that belongs to them: 130 or 143, 0 while
-// nothing was asked. A second request ends the program at once; temporary files go anyway. A
-// request that was ignored when the program started (nohup) stays ignored. Writing to a pipe that
-// no one reads any more fails from here on, instead of ending the program.
+// From now on, Ctrl-C and termination requests are recorded instead of ending the program, and
+// `PendingExit` returns the exit status for them: 130 or 143, 0 without a request. A second
+// request ends the program at once, still deleting temporary files. A request that was ignored at
+// start (nohup) stays ignored. Writing to a pipe without a reader fails from now on instead of
+// ending the program.
 void CatchTermination();
-int PendingExit();  // 130 or 143; 0 while nothing was asked
+int PendingExit();  // 130 or 143; 0 without a request
 
 }  // namespace fotomill::platform

@@ -4,16 +4,16 @@
 
 namespace fotomill::platform {
 
-// Why the system refused what this thread asked of it last, for the message that a person reads:
-// "Permission denied". Opening, creating, writing, renaming and locking files keep it here when
-// they fail and forget it when they begin. Empty when nothing was refused, or when the file just is
-// not there, which callers say better.
+// Why this thread's last system operation failed, for error messages:
+// "Permission denied". Set when opening, creating, writing, renaming or
+// locking a file fails, and cleared when one begins. Empty if nothing
+// failed, or if the file just does not exist, which callers word better.
 const std::string& SystemReason();
 void KeepReason(std::string reason);
 void ForgetReason();
 
-// What the file that this thread replaced last had and the new one could not be given: "its owner
-// and its tags". Empty when nothing is missing. Asking takes it away.
+// Attributes of the file last replaced by this thread that could not be copied to the new one: "its
+// owner and its tags". Empty if none. Reading clears it.
 std::string TakeLostAttributes();
 
 }  // namespace fotomill::platform

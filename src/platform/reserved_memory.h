@@ -8,8 +8,8 @@
 
 namespace fotomill::platform {
 
-// Much room of which little will be used: address space whose pages the system gives, zero and a
-// small one at a time, when they are first touched, and takes back at once when the room is freed.
+// A large, sparsely used block of memory: reserved address space whose pages the system allocates,
+// zeroed and small, at first access, and reclaims when the block is freed.
 class ReservedMemory {
  public:
   ReservedMemory() = default;
@@ -18,15 +18,15 @@ class ReservedMemory {
   ReservedMemory& operator=(ReservedMemory&& other) noexcept;
   ~ReservedMemory() { Free(); }
 
-  // Replaces the room by `size` zero bytes. False, with the room unchanged, if there is no address
-  // space.
+  // Replaces the block with `size` zero bytes. False, with the block unchanged, if address space
+  // runs out.
   [[nodiscard]] bool Reserve(uint64_t size);
-  void Free();  // gives the address space back
+  void Free();  // releases the address space
 
-  // Whether nothing is reserved, and how many bytes are.
+  // Whether nothing is reserved; and the size.
   bool Empty() const { return data_ == nullptr; }
   uint64_t Size() const { return size_; }  // bytes
-  // `count` plain structures from a byte offset on, which the caller keeps inside the room.
+  // `count` plain structs from a byte offset on; the caller keeps them within the block.
   template <typename T>
   std::span<T> Items(uint64_t offset, size_t count) {
     static_assert(std::is_trivially_copyable_v<T> && std::is_trivially_destructible_v<T>);

@@ -4,7 +4,7 @@
 
 namespace fotomill::platform {
 
-// A loaded shared library, unloaded with its owner.
+// A loaded shared library, unloaded by its destructor.
 class SharedLibrary {
  public:
   SharedLibrary() = default;
@@ -12,32 +12,32 @@ class SharedLibrary {
   SharedLibrary& operator=(SharedLibrary&& other) noexcept;
   ~SharedLibrary() { Unload(); }
 
-  // Loads a module by its absolute path; anything but a regular file is refused, and so is a file
-  // that ends before what its headers name. False with `Error()` set.
+  // Loads a module by its absolute path; fails for anything but a regular file, and for a file
+  // shorter than its headers claim. On false, `Error()` is set.
   [[nodiscard]] bool Load(const std::string& absolutePath);
-  // Loads one of the system's own libraries by its bare name ("libjxr.so.0"), wherever the system
-  // keeps them.
+  // Loads a system library by its bare name
+  // ("libjxr.so.0") from the system's search path.
   [[nodiscard]] bool LoadSystem(const std::string& name);
-  bool Loaded() const { return handle_ != nullptr; }  // after Load went well
-  // An export's address, null when it has none of that name.
+  bool Loaded() const { return handle_ != nullptr; }  // true after a successful Load
+  // Address of an exported symbol, null if there is none of that name.
   void* Symbol(const char* name) const;
-  // Null when the library has no such function.
+  // Null if the library has no such function.
   template <typename Function>
   Function* FunctionNamed(const char* name) const {
     return reinterpret_cast<Function*>(Symbol(name));
   }
-  // The system's handle, null without a module, and the system's words on why the last Load failed.
+  // The system's handle, null if nothing is loaded.
   void* Handle() const { return handle_; }
-  // The system's words for what Load could not do.
+  // The system's error message for the last failed Load.
   const std::string& Error() const { return error_; }
-  void Unload();  // its functions must not be called any more
+  void Unload();  // its functions must not be called afterwards
 
  private:
   void* handle_ = nullptr;
   std::string error_;
 };
 
-// What modules of this system are called: pattern parts "FMWPL" and ".so" or ".DLL".
+// File extension of modules on this system: pattern parts "FMWPL" and ".so" or ".DLL".
 extern const char* const kModuleExtension;
 
 }  // namespace fotomill::platform

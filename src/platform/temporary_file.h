@@ -8,10 +8,10 @@
 
 namespace fotomill::platform {
 
-// A working file that is deleted with its owner, and that only its user may read: a unique name
-// with the prefix "FMWT" in the temporary folder, or, when none of at most 260 characters can be
-// had there, "TEMP$$$.$$$" in the working folder. Always created exclusively; a link of that name
-// is never followed.
+// A private temporary file, deleted with its owner, readable only by the
+// user: a unique name with the prefix "FMWT" in the temporary folder or,
+// if that fails or exceeds 260 characters, "TEMP$$$.$$$" in the current
+// folder. Always created exclusively; links are never followed.
 class TemporaryFile {
  public:
   TemporaryFile() = default;
@@ -20,28 +20,28 @@ class TemporaryFile {
   ~TemporaryFile() { Delete(); }
 
   // Creates the empty file, its name ending in `extension` (with dot, ".tmp" by default; the
-  // fall-back name is then "TEMP$$$" with that extension). False when neither name can be had; a
-  // file that was held before is gone then too.
+  // fallback name is then "TEMP$$$" with that extension). False if neither can be created. A
+  // previous file is deleted in any case.
   [[nodiscard]] bool Create(std::string_view extension = {});
-  // Makes `bytes` the whole contents. False when not all could be written.
+  // Replaces the contents. False if not all bytes could be written.
   [[nodiscard]] bool Write(std::span<const uint8_t> bytes);
-  // Becomes a file of `folder`, which is made when it is missing, with what the regular file `path`
-  // holds now: that file itself under a second name where the file system can, else a copy of it
-  // with its time. Who replaces `path` by a new file leaves this one as it is. False when that is
-  // not possible; a file that was held before is gone then too.
+  // Keeps the current contents of the regular file `path` in `folder` (created if missing): as a
+  // hard link if the file system supports it, else as a copy with its modification time. Replacing
+  // `path` by a new file leaves this one unchanged. False on failure. A previous file is deleted in
+  // any case.
   [[nodiscard]] bool Keep(const std::string& path, const std::string& folder);
-  // Each owns the other's file.
+  // Exchanges the files of the two owners.
   void Swap(TemporaryFile& other) {
     std::swap(path_, other.path_);
     std::swap(listed_, other.listed_);
   }
-  // Where the file is; empty if there is none. Delete may be called at any time.
+  // Path of the file; empty if there is none. Delete may be called at any time.
   const std::string& Path() const { return path_; }
-  void Delete();  // does nothing where nothing is kept
+  void Delete();  // does nothing without a file
 
  private:
   std::string path_;
-  int listed_ = -1;  // its number among the names that go when the program is ended at once
+  int listed_ = -1;  // slot in the list of files to delete if the program is killed
 };
 
 }  // namespace fotomill::platform

@@ -4,8 +4,8 @@
 
 namespace fotomill::platform {
 
-// A folder in the system's temporary folder that only its user may enter; it is deleted with its
-// owner, with all that is in it. What a program that was killed left is deleted by the next one.
+// A private folder in the system's temporary folder, deleted with its contents by its owner.
+// Leftovers of a killed program are deleted by the next one.
 class TemporaryFolder {
  public:
   TemporaryFolder() = default;
@@ -13,8 +13,8 @@ class TemporaryFolder {
   TemporaryFolder& operator=(const TemporaryFolder&) = delete;
   ~TemporaryFolder() { Delete(); }
 
-  // Makes the empty folder. False when that is not possible; a folder that was held before is gone
-  // then too.
+  // Creates the empty folder. False on failure.
+  // A previous folder is deleted in any case.
   [[nodiscard]] bool Create();
   const std::string& Path() const { return path_; }  // empty if there is none
   void Delete();

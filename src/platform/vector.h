@@ -1,12 +1,12 @@
 #pragma once
 
-// Functions for processors that have more than the build's baseline. What is between
-// VECTOR_AVX2_BEGIN and VECTOR_AVX2_END is compiled for AVX2 where the build knows it
-// (VECTOR_HAS_AVX2 is 1), and may be called when HasAvx2() says so. Nothing that the baseline uses
-// too, such as a header of the standard library, may be included there.
+// Functions for processors beyond the build's baseline. Code between VECTOR_AVX2_BEGIN and
+// VECTOR_AVX2_END is compiled for AVX2 if the compiler supports it (VECTOR_HAS_AVX2 is 1), and may
+// be called if HasAvx2() is true. Nothing that baseline code uses as well, such as standard
+// headers, may be included there.
 
-// In front of a loop that writes an element and reads others only further on: it may be done
-// several elements at a time.
+// Before a loop that writes an element and
+// reads only later ones: it may be vectorized.
 #if defined(__clang__)
 #define VECTOR_READS_AHEAD _Pragma("clang loop vectorize(assume_safety)")
 #else
@@ -30,7 +30,7 @@
 
 namespace fotomill::platform {
 
-// Whether this processor and its system have AVX2.
+// Whether this processor and operating system support AVX2.
 inline bool HasAvx2() {
 #if VECTOR_HAS_AVX2
   static const bool has = __builtin_cpu_supports("avx2");

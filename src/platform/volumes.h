@@ -6,28 +6,28 @@
 
 namespace fotomill::platform {
 
-// What a volume is on; Unknown where the system does not tell.
+// Kind of a volume's device; Unknown if the system does not say.
 enum class DriveKind { Unknown, Removable, Fixed, Network, Optical, Ram };
 
-// The volume that holds a path: its label and serial number as the system tells them.
+// The volume of a path: its label and serial number as reported by the system.
 struct Volume {
   bool available = false;
   std::string label;    // empty when it has none
-  uint32_t serial = 0;  // of FAT, exFAT and NTFS the same number on every system
+  uint32_t serial = 0;  // for FAT, exFAT and NTFS the same on all systems
   DriveKind kind = DriveKind::Unknown;
 };
 
-// Asks the system about the volume of a file or folder that is there, or whose folder is; any other
-// is not available. Tests put a function of their own in its place.
+// The volume of an existing file or folder, or of a missing file in an existing folder; otherwise
+// not available. Tests may replace this function.
 Volume VolumeOf(const std::string& path);
-using VolumeFunction = Volume (*)(const std::string& path);  // how tests stand in for the system
-void ReplaceVolumeFunction(VolumeFunction function);  // null restores the system's
+using VolumeFunction = Volume (*)(const std::string& path);  // test hook
+void ReplaceVolumeFunction(VolumeFunction function);  // null restores the default
 
-// Where volumes of the user are mounted: drives that were plugged in, discs, shares. In order,
-// without asking the volumes.
+// Mount points of the user's volumes: removable drives, discs, shares. Sorted; the volumes
+// themselves are not accessed.
 std::vector<std::string> UserVolumes();
 
-// Free bytes on the volume of a path (likewise), 0 when unknown.
+// Free bytes on the volume of a path (as above), 0 if unknown.
 uint64_t FreeSpace(const std::string& path);
 
 }  // namespace fotomill::platform

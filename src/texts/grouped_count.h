@@ -8,10 +8,10 @@
 
 namespace fotomill {
 
-// As TrCount, for windows: the count has the thousands separators of the language, "12,345 files".
+// As TrCount, for windows: the count with the language's thousands separators, "12,345 files".
 std::string TrGroupedCountArguments(const char* one, const char* many, uint64_t count,
                                     std::initializer_list<TextArgument> arguments);
-// The same with any number of arguments.
+// As above, with any number of arguments.
 template <typename... Arguments>
 std::string TrGroupedCount(const char* one, const char* many, uint64_t count,
                            const Arguments&... arguments) {

@@ -13,7 +13,7 @@ struct Synonym {
   std::string_view typed, name;
 };
 
-// What people type, and what it is called here; a word may have several meanings. Formats,
+// Words users may type, and our names for them; a word may have several meanings. Formats,
 // commands, options, operations.
 constexpr Synonym kSynonyms[] = {
     {"jxr", "hdp"},

@@ -6,10 +6,10 @@
 
 namespace fotomill {
 
-// The user message of a status, in the user's language. A number outside the table comes from a
-// plug-in: "error 42 of the plug-in". Never empty.
+// The user message of a status, in the user's language. Numbers outside the table come from
+// plug-ins: "error 42 of the plug-in". Never empty.
 std::string StatusText(Status status);
-// The same in English, for what programs read.
+// As StatusText, in English, for machine-readable output.
 std::string EnglishStatusText(Status status);
 
 }  // namespace fotomill

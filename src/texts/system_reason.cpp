@@ -6,7 +6,7 @@
 namespace fotomill {
 
 std::string ReasonSentence() {
-  // The common ones, for translation; others are shown as the system has them.
+  // The common reasons, for translation; others are shown as the system words them.
   [[maybe_unused]] constexpr const char* kKnown[] = {
       TrLater("Permission denied"),       TrLater("Read-only file system"),
       TrLater("No space left on device"), TrLater("Operation not permitted"),

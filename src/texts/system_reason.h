@@ -4,10 +4,10 @@
 
 namespace fotomill {
 
-// Why the system refused what this thread asked of it last (platform/reason.h), as a sentence to
-// follow a message: "Permission denied." Empty without a reason.
+// The reason for this thread's last system error (platform/reason.h), as a sentence to append to a
+// message: "Permission denied." Empty without a reason.
 std::string ReasonSentence();
-// A sentence with the reason behind it.
+// A sentence followed by the reason.
 std::string WithReason(std::string sentence);
 
 }  // namespace fotomill

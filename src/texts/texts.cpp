@@ -35,8 +35,8 @@ constexpr struct {
               {"fr", "Français"},   {"it", "Italiano"}, {"ja", "日本語"},
               {"nl", "Nederlands"}, {"pl", "Polski"},   {"pt", "Português"}};
 
-// Catalogs are in the folder "locale" beside the program as it is built, and in share/locale once
-// it is installed.
+// Catalogs are in the folder "locale" next to the program in a build tree, and in
+// share/locale once installed.
 std::string CatalogFolder() {
   const std::string program = platform::ProgramFolder();
   const std::string beside = platform::JoinFolder(program, "locale");
@@ -57,8 +57,8 @@ std::string Variable(const char* name) {
   return value == nullptr ? std::string() : value;
 }
 
-// The languages that the environment asks for, the best first, separated by colons. As in gettext,
-// LANGUAGE counts only where a locale is set.
+// The languages of the environment in order of preference, separated by colons. As in gettext,
+// LANGUAGE counts only if a locale is set.
 std::string LanguagesOfSystem() {
   std::string locale = Variable("LC_ALL");
   if (locale.empty()) locale = Variable("LC_MESSAGES");
@@ -68,8 +68,7 @@ std::string LanguagesOfSystem() {
   return languages.empty() ? locale : languages;
 }
 
-// The first language of `wanted` that has a catalog, with or without its country; English if none
-// has.
+// The first language of `wanted` with a catalog, with or without its country; else English.
 std::string ChooseLanguage(std::string_view wanted, const std::string& folder) {
   while (!wanted.empty()) {
     const std::string_view item = wanted.substr(0, wanted.find(':'));
@@ -85,8 +84,8 @@ std::string ChooseLanguage(std::string_view wanted, const std::string& folder) {
   return kEnglish;
 }
 
-// gettext translates only where the locale of messages is not "C". The locale of the language
-// itself need not be installed.
+// gettext translates only if the locale for messages is not "C". The locale of the language itself
+// need not be installed.
 void SetMessageLocale() {
   const char* locale = std::setlocale(LC_MESSAGES, "");
   if (locale == nullptr || std::string_view(locale) == "C" || std::string_view(locale) == "POSIX") {
@@ -94,7 +93,7 @@ void SetMessageLocale() {
   }
 }
 
-// `text` with %1, %2, ... replaced. A number without an argument stays as it is.
+// `text` with %1, %2, ... replaced. Numbers without an argument are kept.
 std::string Filled(std::string_view text, std::span<const TextArgument> arguments) {
   std::string result;
   for (size_t i = 0; i < text.size(); ++i) {
@@ -110,7 +109,7 @@ std::string Filled(std::string_view text, std::span<const TextArgument> argument
   return result;
 }
 
-// The form for a count, which is %1 as `digits`.
+// The plural form for a count, with %1 replaced by `digits`.
 std::string FilledCount(const char* one, const char* many, uint64_t count, std::string digits,
                         std::initializer_list<TextArgument> arguments) {
   const char* const english = count == 1 ? one : many;
@@ -127,7 +126,7 @@ bool StartTexts(const std::string& code) {
   const std::string folder = CatalogFolder();
   state.language = ChooseLanguage(code.empty() ? LanguagesOfSystem() : code, folder);
   state.translated = state.language != kEnglish;
-  // toolkits follow it, too
+  // toolkits read it, too
   if (state.translated || !code.empty()) platform::SetVariable("LANGUAGE", state.language);
   if (state.translated) {
     SetMessageLocale();

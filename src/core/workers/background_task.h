@@ -11,8 +11,8 @@
 
 namespace fotomill {
 
-// One piece of work apart that belongs to somebody: it goes with its owner, who asks it to stop and
-// waits for it.
+// A single background task with an owner: destroying
+// it requests a stop and waits for the end.
 class BackgroundTask {
  public:
   using Work = std::function<Status(const StopToken& stop)>;
@@ -22,13 +22,13 @@ class BackgroundTask {
   BackgroundTask(const BackgroundTask&) = delete;
   BackgroundTask& operator=(const BackgroundTask&) = delete;
 
-  // Stops and waits for what was started before, then has `work` run on a thread of the pool, and
-  // `ended` behind it with the status; MemoryAllocationError when the work ran out of memory, or no
-  // thread can be had: `ended` is called here then.
+  // Stops and waits for the previous work, then runs `work` on a pool thread, followed by `ended`
+  // with its status: MemoryAllocationError if it ran out of memory, or if no thread is available;
+  // in that case `ended` is called right here.
   void Start(Lane lane, Work work, std::function<void(Status)> ended = {});
-  void Stop();         // without waiting
+  void Stop();         // does not wait
   void StopAndWait();  // not on the task's own thread
-  void Wait();         // for its end
+  void Wait();         // until it has ended
   bool Running() const;
 
  private:
@@ -41,8 +41,8 @@ class BackgroundTask {
   std::shared_ptr<State> state_;
 };
 
-// Work that no one waits for, since it may hang: `work` has to hold, or to ask for, all that it
-// uses. False when no thread can be had.
+// Runs work that may hang, so that no one waits for it: `work` must own, or share ownership of,
+// everything it uses. False if no thread is available.
 bool RunLoose(std::function<void()> work);
 
 }  // namespace fotomill

@@ -7,7 +7,7 @@ namespace fotomill {
 
 FolderScope::FolderScope(const std::string& path) {
   if (!CoreRelease::HoldsCore()) return;
-  // Files of one folder mostly come one after the other.
+  // Consecutive files are mostly in the same folder.
   thread_local std::string lastFolder;
   thread_local bool lastIsSlow = false;
   const platform::PathParts parts = platform::SplitPath(path);

@@ -7,12 +7,12 @@
 
 namespace fotomill {
 
-// For its lifetime, a task works with a file: where that is on a network folder or a disc, which
-// may hang for minutes, the task keeps no core of the pool busy. Asking where it is may hang as
-// well, and keeps none busy either.
+// Marks a task as working with a file for its lifetime. On a network folder or a disc, which may
+// hang for minutes, the task releases its core of the pool. Finding out where the file is may hang
+// as well, and is also done without a core.
 class FolderScope {
  public:
-  explicit FolderScope(const std::string& path);  // the place of `path` decides
+  explicit FolderScope(const std::string& path);  // `path` decides whether the core is released
 
  private:
   std::optional<CoreRelease> release_;

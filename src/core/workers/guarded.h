@@ -6,9 +6,9 @@
 
 namespace fotomill {
 
-// Runs a piece of work, and is the one place where an exception becomes a status:
-// MemoryAllocationError, since a lack of memory is what libraries and containers throw for.
-// Otherwise what the work returns, Ok where it returns nothing.
+// Runs `work`, turning exceptions into a status; the only place that does. The status is
+// MemoryAllocationError, because libraries and containers throw only for lack of memory. Otherwise
+// returns the result of `work`, or Ok if it returns void.
 template <typename Work>
 Status Guarded(Work&& work) noexcept {
   try {

@@ -27,7 +27,7 @@ void LatestWork::Look() {
   }
 }
 
-// One piece, then to the end of the pool's queue again, so that others have their turn.
+// Does one piece, then requeues at the end of the pool's queue so that others get their turn.
 void LatestWork::DoOne() {
   std::unique_lock lock(mutex_);
   while (!stopped_) {

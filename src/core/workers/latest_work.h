@@ -9,24 +9,24 @@
 
 namespace fotomill {
 
-// Work of which only what is wanted now counts: there is no queue that could grow old. A thread
-// that is free asks for the most urgent piece, does it, and asks again. The owner keeps its
-// requests under a lock of its own, and changes them as it likes.
+// Work where only the latest requests matter, without a queue that could go stale. A free thread
+// asks for the most urgent piece, does it, and asks again. The owner keeps its requests under its
+// own lock and may change them at any time.
 class LatestWork {
  public:
   using Piece = std::function<void()>;
 
-  // `next` gives the piece of work that is wanted most, an empty one when nothing is; it is called
-  // on the pool's threads, as are the pieces, at most `atOnce` at a time.
+  // `next` returns the most urgent piece, or an empty one if there is none. It is called on pool
+  // threads, as are the pieces, at most `atOnce` at a time.
   LatestWork(Lane lane, unsigned atOnce, std::function<Piece()> next,
              WorkerPool& pool = WorkerPool::Shared());
-  // No further piece begins; waits for those that have. The owner's other members have to be there
-  // still.
+  // Starts no further piece and waits for running ones. The owner's members that pieces use must
+  // still be alive.
   ~LatestWork();
   LatestWork(const LatestWork&) = delete;
   LatestWork& operator=(const LatestWork&) = delete;
 
-  // Something may be wanted that was not before.
+  // To be called when there may be new work.
   void Look();
 
  private:
@@ -38,8 +38,8 @@ class LatestWork {
   WorkerPool& pool_;
   std::mutex mutex_;
   std::condition_variable ended_;
-  unsigned running_ = 0;  // tasks of the pool
-  uint64_t looks_ = 0;    // so many calls of Look
+  unsigned running_ = 0;  // tasks in the pool
+  uint64_t looks_ = 0;    // calls of Look so far
   bool stopped_ = false;
 };
 

@@ -27,14 +27,14 @@ void OrderedRun::Run(size_t count, uint32_t jobs) {
     if (threaded_) DeliverAll();
     threaded_ = false;
   }
-  // Also what is left where no worker could continue.
+  // Also runs the remaining items if no worker could continue.
   for (size_t item = begun_; item < count && steps_.goesOn(); ++item) {
     const Status status = Guarded([&] { return steps_.work(item); });
     steps_.deliver(item, status);
   }
 }
 
-// Locked.
+// Called with the lock held.
 bool OrderedRun::StartWorker() {
   if (!pool_.Run(Lane::Compute, [this] { WorkOnOne(); })) return false;
   ++workers_;
@@ -57,7 +57,8 @@ bool OrderedRun::InTurn(size_t item, const std::function<void()>& step) {
   return items_[item].state == State::AtWork;
 }
 
-// Works on one item, then goes to the end of the pool's queue, so that other work has its turn.
+// Processes one item, then requeues at the end of the pool's queue so that other work
+// gets its turn.
 void OrderedRun::WorkOnOne() {
   const bool goesOn = steps_.goesOn();
   std::unique_lock lock(mutex_);
@@ -81,7 +82,7 @@ void OrderedRun::WorkOnOne() {
   if (item == head_ || workers_ == 0) delivered_.notify_one();
 }
 
-// Has workers continue that waited for deliveries. Locked.
+// Resumes workers that waited for deliveries. Called with the lock held.
 void OrderedRun::ResumeWorkers() {
   if (begun_ >= head_ + steps_.ahead) return;
   workers_ -= parked_;

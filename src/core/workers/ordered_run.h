@@ -11,20 +11,20 @@
 
 namespace fotomill {
 
-// Work on numbered items that runs on several threads of the pool and looks from outside as if it
-// were done one item after the other.
+// Processes numbered items on several threads of the pool, with results delivered as if they were
+// processed one after the other.
 class OrderedRun {
  public:
-  // What is done with items, and when.
+  // The callbacks of a run.
   struct Steps {
     std::function<Status(size_t item)> work;  // on any thread, several at a time
-    // On the calling thread, in order, once the item's work is done: with what it returned, or
-    // MemoryAllocationError where it ran out of memory.
+    // On the calling thread, in order, once the item is processed: with the status of `work`, or
+    // MemoryAllocationError if it ran out of memory.
     std::function<void(size_t item, Status status)> deliver;
-    // on any thread, before an item is begun; false: no more are begun
+    // on any thread, before an item is started; false: start no more
     std::function<bool()> goesOn;
     std::function<void()> tick;    // on the calling thread, a few times a second while it waits
-    // an item is not begun while so many before it wait to be delivered
+    // maximum number of items started but not yet delivered
     size_t ahead = 1024;
   };
 
@@ -35,13 +35,13 @@ class OrderedRun {
   OrderedRun& operator=(const OrderedRun&) = delete;
   ~OrderedRun() { Stop(); }
 
-  // Works on items 0 to count - 1, at most `jobs` of them at a time and no more than there are
-  // cores for, and delivers those that were begun. With one job all of it happens on the calling
-  // thread.
+  // Processes items 0 to count - 1, at most `jobs` at a time and
+  // no more than there are cores, and delivers all that were
+  // started. With one job, everything runs on the calling thread.
   void Run(size_t count, uint32_t jobs);
 
-  // For the work on an item: waits until every item before it is delivered, then runs `step` on the
-  // calling thread of Run. Other work has the core meanwhile. False when the run is given up;
+  // For use by `work`: waits until all earlier items are delivered, then runs `step` on the thread
+  // that called Run. The core is free for other work meanwhile. False if the run was canceled;
   // `step` has not run then.
   bool InTurn(size_t item, const std::function<void()>& step);
 
@@ -61,16 +61,16 @@ class OrderedRun {
   const Steps steps_;
   WorkerPool& pool_;
   std::mutex mutex_;
-  std::condition_variable delivered_;  // something for the calling thread
+  std::condition_variable delivered_;  // signals the calling thread
   std::condition_variable answered_;   // a step has run
   std::vector<Item> items_;
-  size_t begun_ = 0;                             // items before this one were begun
-  size_t head_ = 0;                              // the item that is delivered next
-  // tasks of the pool, each works on an item at a time
+  size_t begun_ = 0;                             // items before this one were started
+  size_t head_ = 0;                              // the next item to deliver
+  // tasks in the pool, each processing one item at a time
   size_t workers_ = 0;
-  // of these, those that wait until more is delivered
+  // workers waiting for deliveries
   size_t parked_ = 0;
-  const std::function<void()>* step_ = nullptr;  // of the head item, while it asks
+  const std::function<void()>* step_ = nullptr;  // of the head item, while it waits for an answer
   bool threaded_ = false;
   bool stopped_ = false;
 };

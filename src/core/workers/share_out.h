@@ -9,11 +9,11 @@
 
 namespace fotomill {
 
-// Does parts 0 to `parts` - 1 of a computation, in any order, on the calling thread and on those of
-// the pool that have nothing else to do: on all cores where the program is about one picture, on
-// one where it is about many. The status of a part that is not Ok ends it; MemoryAllocationError
-// when a part ran out of memory, FunctionCancelled when `stop` was asked before the last part
-// began.
+// Runs parts 0 to `parts` - 1 of a computation, in any order, on the calling
+// thread and on idle threads of the pool: on all cores when the program
+// works on one picture, on one when it works on many. The first status other
+// than Ok ends it; MemoryAllocationError if a part ran out of memory,
+// FunctionCancelled if `stop` was requested before the last part began.
 Status ShareOut(int32_t parts, const std::function<Status(int32_t part)>& work,
                 const StopToken& stop = {}, WorkerPool& pool = WorkerPool::Shared());
 

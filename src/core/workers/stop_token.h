@@ -5,12 +5,12 @@
 
 namespace fotomill {
 
-// Asked by work now and then: whether its result is still wanted. Copies ask the same source, and
-// may outlive it.
+// Lets running work check whether its result is still needed. Copies share the same source and may
+// outlive it.
 class StopToken {
  public:
-  StopToken() = default;  // of no source: only the end of the program stops its work
-  // Whether the source was stopped, or the program was asked to end (Ctrl-C, the system's request).
+  StopToken() = default;  // no source: stopped only when the program ends
+  // Whether the source was stopped or the program was asked to end (Ctrl-C, system shutdown).
   bool Asked() const;
 
  private:
@@ -20,14 +20,14 @@ class StopToken {
   std::shared_ptr<const std::atomic<bool>> stopped_;
 };
 
-// Stops the work of those who hold its tokens; once stopped, it stays so. Copies are the same
-// source.
+// Stops work that holds its tokens,
+// permanently. Copies share the same state.
 class StopSource {
  public:
-  // Asks for the end; whoever works notices it at its next look at the token. Any thread may call
-  // both.
+  // Requests a stop; workers notice at their next check of the token. Both
+  // functions are thread-safe.
   void Stop() const { stopped_->store(true, std::memory_order_relaxed); }
-  StopToken Token() const { return StopToken(stopped_); }  // lives on when the source has gone
+  StopToken Token() const { return StopToken(stopped_); }  // may outlive the source
 
  private:
   std::shared_ptr<std::atomic<bool>> stopped_ = std::make_shared<std::atomic<bool>>(false);

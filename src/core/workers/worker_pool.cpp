@@ -12,12 +12,12 @@ namespace fotomill {
 
 namespace {
 
-constexpr size_t kMostThreads = 256;   // more only cost
-constexpr size_t kMostBlocking = 128;  // of these; so many hanging folders leave room for others
-// in the order in which they are looked at
+constexpr size_t kMostThreads = 256;   // more would only add overhead
+constexpr size_t kMostBlocking = 128;  // of these; leaves threads for others if many folders hang
+// in order of priority
 constexpr Lane kLanes[] = {Lane::Urgent, Lane::Blocking, Lane::Compute};
 
-// The pool one of whose cores this thread keeps busy, and whether for a task of Lane::Urgent.
+// The pool that this thread holds a core of, and whether for a task of Lane::Urgent.
 thread_local WorkerPool* coreOf = nullptr;
 thread_local bool coreIsUrgent = false;
 
@@ -32,7 +32,7 @@ WorkerPool::~WorkerPool() {
     ending_ = true;
   }
   wake_.notify_all();
-  // A thread that ends its last task may still begin another one.
+  // A thread finishing its last task may still start another one.
   for (size_t i = 0;; ++i) {
     std::thread thread;
     {
@@ -66,18 +66,18 @@ bool WorkerPool::Run(Lane lane, std::function<void()> task) {
   return false;
 }
 
-// Sees to it that one more thread looks for work. Locked.
+// Ensures that one more thread looks for work. Called with the lock held.
 void WorkerPool::WakeOne() {
   if (idle_ > wakings_) {
     ++wakings_;
     wake_.notify_one();
   } else if (threads_.size() < kMostThreads) {
-    // Where the system has no further thread, those that there are do the work.
+    // If no further thread can be created, the existing ones do the work.
     (void)Guarded([this] { threads_.emplace_back([this] { Work(); }); });
   }
 }
 
-// The same when a core has become free. Locked.
+// As WakeOne, for a core that has become free. Called with the lock held.
 void WorkerPool::WakeForCore() {
   if (HasRoom() && (MayBegin(Lane::Compute) || FindSpare() != spare_.end())) WakeOne();
 }
@@ -98,14 +98,14 @@ bool WorkerPool::TakeTask(Task& task) {
       ++busy_;
     } else {
       ++blocking_;
-      WakeForCore();  // this thread may have come for a core
+      WakeForCore();  // this thread may have been woken for a core
     }
     return true;
   }
   return false;
 }
 
-// One step of spare work, if there is any and a core for it.
+// Runs one step of spare work if there is any and a core is free.
 bool WorkerPool::HelpOut(std::unique_lock<std::mutex>& lock) {
   const auto found = HasRoom() ? FindSpare() : spare_.end();
   if (found == spare_.end()) return false;
@@ -136,7 +136,7 @@ void WorkerPool::Work() {
       coreOf = task.lane != Lane::Blocking ? this : nullptr;
       coreIsUrgent = task.lane == Lane::Urgent;
       (void)Guarded(task.run);
-      task.run = nullptr;  // what it holds goes before the task counts as done
+      task.run = nullptr;  // destroy captured objects before the task counts as done
       coreOf = nullptr;
       lock.lock();
       --running_;
@@ -163,7 +163,7 @@ void WorkerPool::Work() {
   }
 }
 
-// Locked.
+// Called with the lock held.
 void WorkerPool::GiveCore() {
   --busy_;
   if (returning_ > 0) core_.notify_one();
@@ -205,7 +205,7 @@ Helpers::Helpers(WorkerPool& pool, unsigned most, std::function<bool()> step) : 
   if (ownCore_) ++pool_.busy_;
   if (most == 0) return;
   pool_.spare_.push_back(&work_);
-  pool_.WakeForCore();  // the one that comes wakes the next
+  pool_.WakeForCore();  // that one wakes the next
 }
 
 Helpers::~Helpers() {

@@ -13,44 +13,44 @@
 
 namespace fotomill {
 
-// When a task may begin, and whether it counts as keeping a core busy.
+// When a task may start, and whether it occupies a core.
 enum class Lane : uint8_t {
-  Urgent,    // somebody looks at the screen for it: at once; counts, so that others wait instead
-  Blocking,  // it mostly waits, for a network folder or for an answer: at once; does not count
-  Compute,   // when a core is free, in the order of arrival; counts
+  Urgent,    // the user is waiting for it: starts at once; counts, so other tasks wait instead
+  Blocking,  // mostly waits, for a network folder or an answer: starts at once; does not count
+  Compute,   // starts when a core is free, in FIFO order; counts
 };
 
-// The threads of the program. Tasks that compute never keep more cores busy than there are; what
-// waits for something slow does so without a core. Threads begin when they are needed and stay.
+// The program's thread pool. Computing tasks never occupy more cores than there are; blocking tasks
+// run without a core. Threads are started on demand and kept.
 class WorkerPool {
  public:
-  // `quiet` is called on a thread of the pool each time when nothing is left to do.
+  // `quiet` is called on a pool thread each time the pool becomes idle.
   explicit WorkerPool(unsigned cores, std::function<void()> quiet = {});
-  // Waits for every task, also those that have not begun.
+  // Waits for all tasks, including queued ones.
   ~WorkerPool();
   WorkerPool(const WorkerPool&) = delete;
   WorkerPool& operator=(const WorkerPool&) = delete;
 
-  // The pool of the program. It is never destroyed: a task that hangs on a dead network folder does
-  // not keep the program from ending. Its tasks' owners wait for theirs.
+  // The program's pool. It is never destroyed, so a task that hangs on a dead network folder cannot
+  // keep the program from exiting. Task owners wait for their own tasks.
   static WorkerPool& Shared();
 
-  // How many tasks and helpers the pool lets compute at a time, at least 1.
+  // The number of tasks and helpers that may compute at the same time, at least 1.
   unsigned Cores() const { return cores_; }
 
-  // Has a task run on a thread of the pool. An exception that leaves it is dropped: who wants to
-  // know wraps its work in Guarded. False when no thread can be had at all; the task is forgotten
-  // then.
+  // Runs a task on a pool thread. Exceptions from it are
+  // dropped; wrap the work in Guarded to see them. False
+  // if no thread is available; the task is discarded then.
   [[nodiscard]] bool Run(Lane lane, std::function<void()> task);
 
  private:
   friend class Helpers;
   friend class CoreRelease;
 
-  // What threads that have nothing better to do may help with; belongs to a Helpers.
+  // Work that idle threads may help with; owned by a Helpers.
   struct SpareWork {
     std::function<bool()> step;
-    unsigned most = 0;     // threads at a time
+    unsigned most = 0;     // maximum number of threads
     unsigned running = 0;  // threads
     bool exhausted = false;
   };
@@ -73,30 +73,30 @@ class WorkerPool {
   const unsigned cores_;
   const std::function<void()> quiet_;
   std::mutex mutex_;
-  std::condition_variable wake_;    // a thread that waits for work
-  std::condition_variable helped_;  // a step of spare work has ended
-  std::condition_variable core_;    // a core has become free that a task wants back
+  std::condition_variable wake_;    // threads waiting for work
+  std::condition_variable helped_;  // a step of spare work is done
+  std::condition_variable core_;    // a core is free for a task that wants it back
   std::array<std::deque<std::function<void()>>, 3> waiting_;  // by lane
   std::list<SpareWork*> spare_;
   std::vector<std::thread> threads_;
-  size_t idle_ = 0;      // threads that wait for work
-  size_t wakings_ = 0;   // of these, those that were woken and have not noticed
+  size_t idle_ = 0;      // threads waiting for work
+  size_t wakings_ = 0;   // of these, threads woken that have not run yet
   size_t running_ = 0;   // tasks
   size_t blocking_ = 0;  // of these, those of Lane::Blocking
   unsigned busy_ = 0;    // cores
-  unsigned returning_ = 0;  // tasks that want their core back
+  unsigned returning_ = 0;  // tasks waiting to get their core back
   bool ending_ = false;
 };
 
-// Lets threads of the pool that have a core and nothing else to do help with work in small steps,
-// while the calling thread does the same by itself. They begin and leave at any time: where the
-// pool is busy with tasks, no one comes.
+// Has idle pool threads that can get a core help with work in small
+// steps, while the calling thread does the same. They join and
+// leave at any time; if the pool is busy with tasks, none may join.
 class Helpers {
  public:
-  // `step` does a piece of the work, on up to `most` threads at once; false if there is none left
-  // to begin.
+  // `step` does one piece of the work, on up to `most` threads at a time; false if there is nothing
+  // left to start.
   Helpers(WorkerPool& pool, unsigned most, std::function<bool()> step);
-  // No further step begins; waits for those that have.
+  // Starts no further step; waits for running ones.
   ~Helpers();
   Helpers(const Helpers&) = delete;
   Helpers& operator=(const Helpers&) = delete;
@@ -104,19 +104,19 @@ class Helpers {
  private:
   WorkerPool& pool_;
   WorkerPool::SpareWork work_;
-  bool ownCore_ = false;  // the calling thread is no task of the pool, but computes as well
+  bool ownCore_ = false;  // the calling thread is not a pool task, but computes as well
 };
 
-// For its lifetime, the task that makes it waits for something slow: its core is another one's. At
-// the end it waits for a core, before any task that has not begun; one of Lane::Urgent does not
-// wait.
+// Marks the current task as waiting for something slow for its
+// lifetime, releasing its core. The destructor waits for a core,
+// ahead of queued tasks; a task of Lane::Urgent does not wait.
 class CoreRelease {
  public:
-  CoreRelease();  // hands the thread's core to others while it waits
+  CoreRelease();  // releases the thread's core
   ~CoreRelease();
   CoreRelease(const CoreRelease&) = delete;
   CoreRelease& operator=(const CoreRelease&) = delete;
-  // Whether the calling thread is a task that has a core.
+  // Whether the calling thread is a task with a core.
   static bool HoldsCore();
 
  private:

@@ -15,19 +15,19 @@ namespace fotomill::platform {
 namespace {
 
 constexpr const char* kAccessList = "system.posix_acl_access";
-constexpr size_t kMostTries = 3;  // attributes may grow while they are read
+constexpr size_t kMostTries = 3;  // attributes may grow between the calls
 
-// Attributes that belong to the file and not to its contents; signatures and capabilities of the
-// old contents stay behind.
+// Attributes of the file rather than of its contents; signatures and capabilities of the old
+// contents are not copied.
 bool GoesAlong(std::string_view name) {
   return name.starts_with("user.") || name.starts_with("trusted.") || name == "security.selinux" ||
          name == kAccessList;
 }
 
-// The system's own, which it gives to new files by itself: no one misses them.
+// Attributes the system sets on new files by itself are not reported as lost.
 bool IsMissed(std::string_view name) { return name.starts_with("user.") || name == kAccessList; }
 
-// What a call that fills a buffer gives, however long that is; false with errno.
+// Calls a function that fills a buffer, growing the buffer as needed; false with errno.
 template <typename Call>
 bool ReadAll(Call call, std::vector<char>& into) {
   for (size_t attempt = 0; attempt < kMostTries; ++attempt) {
@@ -49,8 +49,8 @@ void Add(std::string& list, std::string_view what) {
   list.append(list.empty() ? "" : ", ").append(what);
 }
 
-// Owner and group; only the superuser gives files away. Permissions meant for a group do not go to
-// another one.
+// Owner and group; only the superuser can give files away. Group permissions are not granted to a
+// different group.
 void CopyOwner(const struct stat& old, int to, mode_t& mode, std::string& lost) {
   struct stat now;
   if (fstat(to, &now) != 0) return;
@@ -75,7 +75,7 @@ std::string CopyAttributes(const std::string& path, const struct stat& old, int 
   std::string lost;
   mode_t mode = old.st_mode & 0777;
   CopyOwner(old, to, mode, lost);
-  fchmod(to, mode);  // without the user's mask; where that fails it has fewer, never more
+  fchmod(to, mode);  // bypasses the umask; on failure there are fewer permissions, never more
   std::vector<char> names;
   if (!ReadAll([&](char* data, size_t size) { return llistxattr(path.c_str(), data, size); },
                names))
@@ -89,7 +89,7 @@ std::string CopyAttributes(const std::string& path, const struct stat& old, int 
                                                       : "attribute " + std::string(name));
     }
   }
-  // What the folder gives to new files would let in whom the old file kept out.
+  // The folder's default ACL could grant access that the old file denied.
   if (!accessList && fremovexattr(to, kAccessList) == 0) fchmod(to, mode);
   return lost;
 }

@@ -6,9 +6,9 @@
 
 namespace fotomill::platform {
 
-// Gives an open file the owner, group, permissions, access control list and extended attributes of
-// the regular file `path`, whose facts `old` holds, as far as the system lets this user. Returns
-// what could not be given, as TakeLostAttributes says it.
+// Copies owner, group, permissions, access control list and extended attributes of the regular file
+// `path`, whose stat is `old`, to an open file, as far as this user may. Returns what could not be
+// copied, worded as for TakeLostAttributes.
 std::string CopyAttributes(const std::string& path, const struct stat& old, int to);
 
 }  // namespace fotomill::platform

@@ -23,8 +23,8 @@ bool IsNotKnown(int error) {
   return error == EINVAL || error == ENOSYS || error == EOPNOTSUPP || error == EPERM;
 }
 
-// What came out of the exchange is not what was expected: it goes back to its place. Somebody may
-// have replaced the new file already; then that one is the newest and stays.
+// Undoes an exchange that found a different file than expected. If the new file was replaced in the
+// meantime, that newer one stays.
 CommitResult PutBack(const std::string& temporary, const std::string& path, const FileStamp& fresh,
                      bool& keep) {
   keep = !Exchange(temporary, path);
@@ -43,8 +43,8 @@ CommitResult ReplaceByExchange(const std::string& temporary, const std::string& 
   return CommitResult::Done;
 }
 
-// The old file has a second name while the new one takes its place. false: the file system knows no
-// second names.
+// Keeps a hard link to the old file while the new one replaces it. False if the file system has no
+// hard links.
 bool ReplaceByLink(const std::string& temporary, const std::string& path, const FileStamp& expected,
                    CommitResult& result) {
   const std::string aside = temporary + "~";

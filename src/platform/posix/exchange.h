@@ -8,19 +8,19 @@
 
 namespace fotomill::platform {
 
-// Puts the file `temporary` in the place of `path`, which must still be what `expected` says: Taken
-// when it is not, and then stays. After Done, and only then, there is no `temporary` any more;
-// after Failed with `keep` set it holds the only copy of what another program has written, and must
-// stay.
+// Replaces `path` with the file `temporary` if `path` is still what `expected` says;
+// otherwise returns Taken and leaves it. After Done, and only then, `temporary` no longer
+// exists; after Failed with `keep` set, it holds the only copy of what another program has
+// written, and must be kept.
 CommitResult ReplaceExpected(const std::string& temporary, const std::string& path,
                              const FileStamp& expected, bool& keep);
 
-// The first way that is tried: one step that exchanges both names, else a second name for the old
-// file by which it is looked at afterwards, else a look before. Tests begin further down than the
-// system would need to.
+// The first method to try: atomically exchange both names,
+// else hard-link the old file and check it afterwards,
+// else check it before. Tests start further down the list.
 enum class ReplaceWay { Exchange, Link, Look };
 extern std::atomic<ReplaceWay> replaceWay;
-// Called between the look at the old file and the step that replaces it; for tests, null otherwise.
+// Test hook, called between checking and replacing the old file; otherwise null.
 extern std::atomic<void (*)(const std::string& path)> beforeReplacing;
 
 }  // namespace fotomill::platform

@@ -21,13 +21,13 @@ namespace fotomill::platform {
 
 namespace {
 
-constexpr uint64_t kMappedFrom = 256 * 1024;       // up to here one read is cheaper than a mapping
-constexpr uint64_t kDropStep = uint64_t{2} << 20;  // bytes given back at a time
+constexpr uint64_t kMappedFrom = 256 * 1024;       // below this, reading is cheaper than mapping
+constexpr uint64_t kDropStep = uint64_t{2} << 20;  // bytes released at a time
 constexpr size_t kMostMappings = 256;
 
-// The mapped views. A mapping whose file was cut short raises SIGBUS when the lost part is touched;
-// the handler puts zero pages there and marks the view, so that one file cannot take the program
-// down. Slots are only ever reused.
+// The mapped views. Accessing a mapping beyond the end of a truncated file raises SIGBUS; the
+// handler maps zero pages there and marks the view, so that one file cannot crash the program.
+// Slots are reused, never freed.
 struct MappedRange {
   std::atomic<uintptr_t> begin{0};  // 0: the slot is free
   std::atomic<uintptr_t> end{0};    // up to the end of the last page
@@ -39,7 +39,8 @@ static_assert(std::atomic<uintptr_t>::is_always_lock_free,
 struct sigaction previousAction;
 uintptr_t pageSize = 4096;
 
-// Puts zero pages from the touched one to the end of its view; false when the address is in none.
+// Maps zero pages from the faulting page to the end of its view; false if the address is
+// in no view.
 bool ReplaceLostPages(uintptr_t address) {
   for (MappedRange& range : mappedRanges) {
     const uintptr_t begin = range.begin.load(), end = range.end.load();
@@ -53,10 +54,10 @@ bool ReplaceLostPages(uintptr_t address) {
 }
 
 void OnBusError(int signalNumber, siginfo_t* info, void*) {
-  const bool fromMemory = info->si_code > 0;  // not sent by a program
+  const bool fromMemory = info->si_code > 0;  // as opposed to kill()
   if (fromMemory && ReplaceLostPages(reinterpret_cast<uintptr_t>(info->si_addr))) return;
   sigaction(signalNumber, &previousAction, nullptr);
-  if (!fromMemory) raise(signalNumber);  // an access raises it again by itself
+  if (!fromMemory) raise(signalNumber);  // a memory access raises it again by itself
 }
 
 void InstallBusHandler() {
@@ -71,7 +72,7 @@ void InstallBusHandler() {
   });
 }
 
-// Enters a mapping into the table; null when the table is full.
+// Registers a mapping; null if the table is full.
 MappedRange* EnterRange(const void* data, uint64_t size) {
   static std::mutex mutex;
   const std::lock_guard lock(mutex);
@@ -161,7 +162,7 @@ bool FileView::ReadAt(uint64_t offset, std::span<uint8_t> into) const {
 
 void FileView::Close() {
   if (mapping_ != nullptr) {
-    // first: once unmapped, the addresses may be another view's
+    // first: after munmap, the addresses may belong to another view
     static_cast<MappedRange*>(mapping_)->begin = 0;
     munmap(const_cast<uint8_t*>(data_), static_cast<size_t>(size_));
     mapping_ = nullptr;
@@ -173,8 +174,8 @@ void FileView::Close() {
   size_ = fileSize_ = dropped_ = 0;
 }
 
-// The page in which a shortened file now ends reads as zeros without a signal, so its length is
-// asked as well.
+// The partial last page of a truncated file reads as zeros without a signal, so the size is checked
+// as well.
 bool FileView::Intact() const {
   if (mapping_ == nullptr) return true;
   struct stat facts;

@@ -25,17 +25,17 @@ namespace fotomill::platform {
 namespace {
 
 constexpr int kMostAppearances = 3;
-constexpr uint64_t kFirstRead = 64 * 1024;  // for files that do not tell their size
+constexpr uint64_t kFirstRead = 64 * 1024;  // for files that do not report their size
 
 FileKind KindOf(mode_t mode) {
   if (S_ISREG(mode)) return FileKind::Regular;
   return S_ISDIR(mode) ? FileKind::Folder : FileKind::Other;
 }
 
-// Whether the last call failed because there is nothing of that name, or can be nothing.
+// Whether the last call failed because the name does not or cannot exist.
 bool NothingThere() { return errno == ENOENT || errno == ENOTDIR || errno == ENAMETOOLONG; }
 
-// Kind of a folder's entry; Missing when it has gone since it was listed.
+// Kind of a folder entry; Missing if it was deleted since it was listed.
 FolderEntry EntryOf(int folder, const dirent& entry) {
   FolderEntry result{entry.d_name, FileKind::Other, entry.d_type == DT_LNK};
   if (entry.d_type == DT_REG) result.kind = FileKind::Regular;
@@ -55,9 +55,9 @@ FolderEntry EntryOf(int folder, const dirent& entry) {
   return result;
 }
 
-// Reads an open file to its end into `contents`, however long it says it is.
+// Reads an open file to its end into `contents`, whatever size it reports.
 ReadResult ReadToEnd(int handle, uint64_t size, uint64_t most, std::string& contents) {
-  uint64_t room = size == 0 ? kFirstRead : size + 1;  // one more byte: it may have grown
+  uint64_t room = size == 0 ? kFirstRead : size + 1;  // one extra byte detects a grown file
   uint64_t done = 0;
   for (;;) {
     room = std::min(room, most + 1);
@@ -231,7 +231,7 @@ ReadResult ReadWholeFile(const std::string& path, uint64_t most, std::string& co
     const bool missing = errno == ENOENT;
     if (!FileExists(path)) return ReadResult::Missing;
     if (!missing || attempt == kMostAppearances) return ReadResult::Failed;
-    // someone has just made it, unless it is a link to nothing
+    // it was just created, unless it is a dangling link
     handle = OpenRegular(path.c_str(), O_RDONLY, facts);
   }
   const uint64_t size = static_cast<uint64_t>(facts.st_size);

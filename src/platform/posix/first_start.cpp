@@ -19,18 +19,18 @@
 #include "platform/clock.h"
 #include "platform/posix/handle.h"
 
-// The first start holds the lock of a file NAME.lock in a folder that only the user can enter, and
-// listens at the socket NAME beside it. Later ones send their message, end of sending is its end,
-// and get a byte when it was taken. The lock goes with the program that holds it, however that
-// ends; the socket it leaves behind is replaced by the next one that gets the lock.
+// The first instance locks the file NAME.lock in a folder only the user can access, and listens on
+// the socket NAME in that folder. Later instances send their message, shut down sending, and
+// receive a byte once it is accepted. The lock ends with its process, however that ends; a leftover
+// socket is replaced by the next instance that gets the lock.
 
 namespace fotomill::platform {
 
 namespace {
 
 constexpr size_t kMostMessage = 1 << 16;
-constexpr int kPollMs = 20;         // between two attempts
-constexpr double kSendSeconds = 2;  // that a later start may take to send its message
+constexpr int kPollMs = 20;         // between attempts
+constexpr double kSendSeconds = 2;  // time limit for a later instance to send its message
 constexpr char kTaken = 1;
 
 bool IsOwnFolder(const std::string& path) {
@@ -39,7 +39,7 @@ bool IsOwnFolder(const std::string& path) {
          (facts.st_mode & 077) == 0;
 }
 
-// Empty when the system has no such folder.
+// Empty if the system has no such folder.
 std::string RuntimeFolder() {
   const char* const given = std::getenv("XDG_RUNTIME_DIR");
   if (given != nullptr && *given == '/' && IsOwnFolder(given)) return given;
@@ -60,7 +60,7 @@ Handle MakeSocket() {
   return Handle(socket(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC | SOCK_NONBLOCK, 0));
 }
 
-// Waits until the handle is ready, or the time has come.
+// Waits until the handle is ready or time is up.
 bool WaitFor(int handle, short events, double until) {
   for (;;) {
     const double left = until - MonotonicSeconds();
@@ -82,7 +82,7 @@ bool Send(int socket, const std::string& message, double until) {
   return shutdown(socket, SHUT_WR) == 0;
 }
 
-// Everything up to the end of sending; nothing when it is too much or comes too late.
+// Reads to the end of the message; nullopt if it is too long or too late.
 std::optional<std::string> Receive(int socket) {
   std::string message;
   char part[4096];
@@ -102,7 +102,7 @@ class Caller : public LaterStart {
       : socket_(std::move(socket)), message_(std::move(message)) {}
   const std::string& Message() const override { return message_; }
   bool Accept() override {
-    // One that has given up has closed its end.
+    // A later instance that has given up has closed its end.
     pollfd state = {socket_.Number(), POLLOUT, 0};
     if (poll(&state, 1, 0) != 1 || (state.revents & (POLLHUP | POLLERR)) != 0) return false;
     return send(socket_.Number(), &kTaken, 1, MSG_NOSIGNAL) == 1;
@@ -118,13 +118,13 @@ class Caller : public LaterStart {
 struct FirstStart::Place {
   std::string lockPath, socketPath;
   Handle lock, socket;
-  Handle stop, stopped;  // a pipe that ends the listening when it is closed
+  Handle stop, stopped;  // pipe; closing it ends the listening thread
 
-  // False while another one holds it.
+  // False if another instance holds it.
   bool Lock() {
     Handle file(OpenHandle(lockPath.c_str(), O_RDWR | O_CREAT | O_NOFOLLOW, 0600));
     if (!file.IsOpen() || flock(file.Number(), LOCK_EX | LOCK_NB) != 0) return false;
-    // The one before may have deleted it between opening and locking.
+    // The previous instance may have deleted it between open and lock.
     struct stat mine = {}, there = {};
     if (fstat(file.Number(), &mine) != 0 || stat(lockPath.c_str(), &there) != 0 ||
         mine.st_ino != there.st_ino)
@@ -208,7 +208,7 @@ void FirstStart::Listen(std::function<void(std::shared_ptr<LaterStart> start)> c
   };
   try {
     listener_ = std::thread(listenOn);
-  } catch (const std::system_error&) {  // no thread can be had: no one hands anything over
+  } catch (const std::system_error&) {  // no thread available: later instances run on their own
   }
 }
 

@@ -22,14 +22,14 @@ std::string WithoutClosingSeparator(std::string path) {
   return path;
 }
 
-// A folder named by an environment variable; empty unless it is absolute, as the base directory
-// specification asks.
+// A folder from an environment variable; empty unless it is absolute, as the base directory
+// specification requires.
 std::string FolderFromEnvironment(const char* name) {
   const char* value = std::getenv(name);
   return value != nullptr && value[0] == '/' ? WithoutClosingSeparator(value) : std::string();
 }
 
-// The user's entry in the password database, or null. Its texts are in `buffer`.
+// The user's entry in the password database, or null. Its strings are stored in `buffer`.
 const passwd* PasswordEntry(passwd& entry, std::vector<char>& buffer) {
   passwd* found = nullptr;
   buffer.resize(4096);
@@ -57,8 +57,7 @@ std::string FolderOrHomeChild(const char* variable, std::string_view child) {
   return home.empty() ? home : JoinFolder(home, child);
 }
 
-// A value of user-dirs.dirs, as in  XDG_PICTURES_DIR="$HOME/Pictures" ; empty when it is not of
-// that shape.
+// A value of user-dirs.dirs, as in XDG_PICTURES_DIR="$HOME/Pictures"; empty if it is malformed.
 std::string UserFolderValue(std::string_view value, const std::string& home) {
   if (value.size() < 2 || value.front() != '"') return {};
   std::string text;
@@ -72,8 +71,7 @@ std::string UserFolderValue(std::string_view value, const std::string& home) {
   return text.starts_with('/') ? WithoutClosingSeparator(text) : std::string();
 }
 
-// A folder that the user named in user-dirs.dirs, else the one of the usual name where it exists,
-// else home.
+// A folder set in user-dirs.dirs, else the one with the usual name if it exists, else home.
 std::string UserFolder(std::string_view key, std::string_view usualName) {
   const std::string home = HomeFolder();
   const std::string configuration = FolderOrHomeChild("XDG_CONFIG_HOME", ".config");
@@ -111,7 +109,7 @@ std::string SpecialFolderPath(SpecialFolder folder) {
   return {};
 }
 
-// The first field of the entry's comment is the full name, in which "&" stands for the login name.
+// The full name is the first field of the GECOS entry; "&" stands for the login name.
 std::string UserFullName() {
   passwd entry;
   std::vector<char> buffer;
@@ -141,7 +139,7 @@ std::string ProgramPath() {
     }
     path.resize(path.size() * 2);
   }
-  // what the system adds once the file was replaced by an update
+  // appended by the kernel after an update has replaced the file
   constexpr std::string_view deleted = " (deleted)";
   if (path.ends_with(deleted) && !FileExists(path)) path.resize(path.size() - deleted.size());
   return path;
@@ -158,7 +156,7 @@ std::string CurrentFolder() {
     path.resize(path.size() * 2);
   }
   path.resize(path.find('\0'));
-  return path.starts_with('/') ? path : std::string();  // "(unreachable)/..." names nothing
+  return path.starts_with('/') ? path : std::string();  // "(unreachable)/..." is not a path
 }
 
 std::string AbsolutePath(const std::string& path) {

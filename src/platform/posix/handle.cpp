@@ -16,11 +16,11 @@ std::atomic<RefusingRename> refusingRename{RefusingRename::Directly};
 
 namespace {
 
-// one read or write; the system takes at most 2 GiB
+// per read or write call; the kernel transfers at most 2 GiB
 constexpr uint64_t kMostAtOnce = uint64_t{1} << 30;
 
-// Whether both names lead to one entry of a folder: one file with a single name, as "a.jpg" and
-// "A.JPG" are where case does not count.
+// Whether both names refer to one directory entry, such as "a.jpg" and "A.JPG" on a
+// case-insensitive file system.
 bool OneEntry(const std::string& from, const std::string& to) {
   struct stat first, second;
   return lstat(from.c_str(), &first) == 0 && lstat(to.c_str(), &second) == 0 &&
@@ -28,7 +28,8 @@ bool OneEntry(const std::string& from, const std::string& to) {
          from != to;
 }
 
-// The two ways below are for files: a folder has no hard links, and nothing else can hold its name.
+// The next two functions are for files only: folders cannot be hard-linked or reserved
+// by a placeholder.
 CommitResult RenameByLink(const std::string& from, const std::string& to) {
   if (linkat(AT_FDCWD, from.c_str(), AT_FDCWD, to.c_str(), 0) != 0) {
     return errno == EEXIST ? CommitResult::Taken : CommitResult::Failed;
@@ -54,7 +55,7 @@ CommitResult RenameOverPlaceholder(const std::string& from, const std::string& t
 bool Handle::Reset(int number) {
   const int old = number_;
   number_ = number;
-  // interrupted: the descriptor is closed anyway
+  // after EINTR the descriptor is closed anyway
   return old < 0 || close(old) == 0 || errno == EINTR;
 }
 

@@ -10,7 +10,7 @@
 
 namespace fotomill::platform {
 
-// An open file descriptor that closes itself.
+// An open file descriptor, closed by its destructor.
 class Handle {
  public:
   explicit Handle(int number = -1) : number_(number) {}  // owns the number
@@ -23,54 +23,54 @@ class Handle {
   Handle& operator=(const Handle&) = delete;
   ~Handle() { Reset(); }
 
-  // The system's number, -1 for none. Release hands the file over to the caller, who closes it.
+  // The file descriptor, -1 for none.
   int Number() const { return number_; }
   bool IsOpen() const { return number_ >= 0; }
-  // Hands the number out; it is the caller's to close.
+  // Gives up ownership; the caller must close the descriptor.
   int Release() {
     const int number = number_;
     number_ = -1;
     return number;
   }
-  // Closes it and takes over `number`; false when closing reported an error (a write that came too
-  // late).
+  // Closes it and takes ownership of `number`; false if closing reported an error (a
+  // delayed write failed).
   bool Reset(int number = -1);
 
  private:
   int number_;
 };
 
-// open(2) with O_CLOEXEC, repeated when a signal interrupts it.
+// open(2) with O_CLOEXEC, retried on EINTR.
 Handle OpenHandle(const char* path, int flags, mode_t mode = 0);
-// Opens a regular file and tells its facts. Nothing else opens: not a folder, FIFO, device or
-// socket, judged before opening (opening a device can set it in motion) and again on the open
-// handle. Never blocks. errno tells why it failed.
+// Opens a regular file and returns its stat. Anything else (folder, FIFO, device, socket) fails,
+// checked before opening (opening a device can have side effects) and again on the open descriptor.
+// Never blocks. Sets errno on failure.
 Handle OpenRegular(const char* path, int flags, struct stat& facts);
 
-// Reads until `size` bytes or the end of the file; the number of bytes read, -1 on an error.
-// `offset` -1 reads on from the handle's position.
+// Reads until `size` bytes or the end of the file; returns the number of bytes read, -1 on an
+// error. `offset` -1 reads from the current position.
 int64_t ReadFully(int handle, uint8_t* data, uint64_t size, int64_t offset = -1);
-// Writes all of it, or answers false.
+// Writes all bytes, or returns false.
 bool WriteFully(int handle, const uint8_t* data, uint64_t size, int64_t offset = -1);
 
-// Whether outputs are made without a name and get it when they are whole (O_TMPFILE). Tests walk
-// the ways of systems that cannot make such files, or that make them and then refuse the name.
+// Whether output files can be created unnamed and linked when complete (O_TMPFILE). Tests simulate
+// systems that cannot create such files, or that create them but cannot link them.
 enum class UnnamedFiles { Work, DoNotWork, GetNoName };
-extern std::atomic<UnnamedFiles> unnamedFiles;  // which of them is taken; tests change it
+extern std::atomic<UnnamedFiles> unnamedFiles;  // changed by tests only
 
-// fsync(2), repeated when a signal interrupts it.
+// fsync(2), retried on EINTR.
 bool SyncHandle(int handle);
-// The folder of a path as it can be opened: "." for a bare name.
+// The folder of a path in a form that open() accepts: "." for a bare name.
 std::string OpenableFolderOf(const std::string& path);
-// Makes the names in the folder of `path` last. Its failure is not reported: the file itself is in
-// place, and some file systems cannot do it.
+// Syncs the directory of `path`. Errors are ignored: the file itself is in place, and some file
+// systems do not support it.
 void SyncFolderOf(const std::string& path);
 
-// Gives `from` the name `to` unless that is taken, in one step: by the rename that refuses, else by
-// a hard link, else (file systems that know neither) by taking the name with an empty file first.
+// Renames `from` to `to` atomically unless that name exists: by a no-replace rename, else by a hard
+// link, else (file systems with neither) by reserving the name with an empty file first.
 CommitResult RenameRefusing(const std::string& from, const std::string& to);
-// The first of these ways that is tried; tests begin further down than the system would need to.
+// The first method to try; tests start further down the list.
 enum class RefusingRename { Directly, ByLink, ByPlaceholder };
-extern std::atomic<RefusingRename> refusingRename;  // where it begins; tests change it
+extern std::atomic<RefusingRename> refusingRename;  // changed by tests only
 
 }  // namespace fotomill::platform

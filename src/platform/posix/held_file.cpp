@@ -14,7 +14,7 @@ namespace fotomill::platform {
 
 namespace {
 
-constexpr int kMostReplacements = 1000;  // of a file whose lock is waited for
+constexpr int kMostReplacements = 1000;  // of a file while waiting for its lock
 
 struct Registry {
   std::mutex mutex;
@@ -42,8 +42,8 @@ FileStamp StampOf(const std::string& path) {
   return stamp;
 }
 
-// Who waited for the lock may find that the file was replaced meanwhile, by the one that held it;
-// then the new one is locked.
+// By the time the lock is acquired, its previous holder may have replaced the file; then the new
+// file is locked.
 bool HeldFile::Hold(const std::string& path) {
   Release();
   changed_ = false;

@@ -16,9 +16,9 @@ namespace fotomill::platform {
 
 namespace {
 
-// Waits until there is something to read, or the end; false when the program was asked to end.
+// Waits for data or the end of input; false if the program was asked to end.
 bool WaitFor(int handle) {
-  constexpr int kPatienceMs = 100;  // a signal between the question and the wait is seen after it
+  constexpr int kPatienceMs = 100;  // limits the delay of a signal that arrives just before poll()
   pollfd input = {handle, POLLIN, 0};
   while (PendingExit() == 0) {
     if (poll(&input, 1, kPatienceMs) > 0) return true;
@@ -43,7 +43,7 @@ std::optional<size_t> ReadInput(std::span<uint8_t> buffer) {
   return ReadSome(STDIN_FILENO, buffer);
 }
 
-// Opening a FIFO would wait for its writer; without blocking, the first read does.
+// A blocking open of a FIFO would wait for a writer; opened non-blocking, the first read waits.
 ReadResult ReadListFile(const std::string& path, uint64_t most, std::string& contents) {
   contents.clear();
   ForgetReason();

@@ -4,11 +4,11 @@
 
 namespace fotomill::platform {
 
-// Keeps what errno says as this thread's reason; errno stays. What only says that there is no such
-// file, or a file of another kind, is no reason.
+// Records errno as this thread's reason, without changing errno. Ignored if it only means that the
+// file does not exist or is of another kind.
 void KeepErrno();
 
-// What TakeLostAttributes gives.
+// Sets what TakeLostAttributes returns.
 void KeepLostAttributes(std::string names);
 
 }  // namespace fotomill::platform

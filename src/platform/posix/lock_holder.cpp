@@ -16,7 +16,7 @@ namespace {
 constexpr const char* kUnknown = "another program";
 constexpr uint64_t kMostText = 1 << 20;
 
-// The first line of a small text of the system; empty when it cannot be read.
+// The first line of a small file in /proc; empty if it cannot be read.
 std::string LineOf(const std::string& path) {
   std::string text;
   if (ReadWholeFile(path, kMostText, text) != ReadResult::Done) return {};
@@ -25,9 +25,9 @@ std::string LineOf(const std::string& path) {
 
 }  // namespace
 
-// /proc/locks has lines such as "3: FLOCK  ADVISORY  WRITE 123 08:01:4567 0 EOF", with the file's
-// number behind its device; some file systems give another device there than to the file itself, so
-// that only the number counts.
+// /proc/locks has lines such as "3: FLOCK ADVISORY WRITE 123 08:01:4567 0 EOF", with the inode
+// after the device; some file systems report a different device there than in stat, so only the
+// inode is compared.
 std::string LockHolder(int handle) {
   struct stat facts;
   std::string text;

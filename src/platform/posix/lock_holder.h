@@ -4,11 +4,11 @@
 
 namespace fotomill::platform {
 
-// Who holds the lock on the file that is open as `handle`: "fotomill (process 123)", "another
-// program" where the system does not tell.
+// The holder of the lock on the open file `handle`: "fotomill (process 123)", or "another program"
+// if unknown.
 std::string LockHolder(int handle);
 
-// The path that an open file has now; empty where the system does not tell.
+// The current path of an open file; empty if unknown.
 std::string PathOfHandle(int handle);
 
 }  // namespace fotomill::platform

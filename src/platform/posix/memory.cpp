@@ -27,15 +27,15 @@ std::atomic<int64_t> faultCountdown{0};
 
 namespace {
 
-constexpr uint64_t kPooledFrom = uint64_t{1} << 20;  // smaller blocks are left to malloc
+constexpr uint64_t kPooledFrom = uint64_t{1} << 20;  // smaller blocks use malloc
 constexpr uint64_t kHugePage = uint64_t{2} << 20;
-constexpr uint64_t kSmallUnit = 64 * 1024;  // blocks below two huge pages come in these
+constexpr uint64_t kSmallUnit = 64 * 1024;  // allocation unit of blocks below two huge pages
 constexpr size_t kPooledBlocks = 16;
 constexpr uint64_t kPooledBytes = uint64_t{512} << 20;
 
 #ifdef FOTOMILL_ADDRESS_SANITIZER
-// Mapped blocks are unknown to the sanitizer: it is told which of their bytes may be touched, and
-// each has some to spare behind its end.
+// The address sanitizer does not know mapped blocks: their accessible bytes are marked by hand, and
+// each block has a guard zone after its end.
 constexpr uint64_t kGuard = 4096;
 void AllowBytes(const uint8_t* data, uint64_t size, uint64_t capacity) {
   __asan_unpoison_memory_region(data, size);
@@ -51,8 +51,7 @@ struct FreeBlock {
   uint64_t capacity;
 };
 
-// Blocks that wait for their next owner, the oldest first. Plain data, so that it outlives every
-// block of a static.
+// Free blocks, oldest first. Trivially destructible, so it outlives blocks held by statics.
 struct BlockPool {
   std::mutex mutex;
   FreeBlock blocks[kPooledBlocks];
@@ -80,7 +79,7 @@ void Unmap(FreeBlock block) {
   munmap(block.data, static_cast<size_t>(block.capacity));
 }
 
-// Gives the oldest blocks back until the pool holds at most `bytes`.
+// Unmaps the oldest blocks until the pool holds at most `bytes`.
 void ShrinkPool(uint64_t bytes) {
   for (;;) {
     FreeBlock block;
@@ -93,8 +92,7 @@ void ShrinkPool(uint64_t bytes) {
   }
 }
 
-// The smallest pooled block that is large enough without being wasteful; data is null if there is
-// none.
+// The smallest pooled block that fits without wasting too much; data is null if there is none.
 FreeBlock TakeFromPool(uint64_t capacity) {
   const std::lock_guard lock(pool.mutex);
   size_t best = pool.count;
@@ -106,7 +104,7 @@ FreeBlock TakeFromPool(uint64_t capacity) {
   return best == pool.count ? FreeBlock{nullptr, 0} : pool.Remove(best);
 }
 
-// Keeps the block for later, or unmaps it when the pool holds enough.
+// Returns a block to the pool, or unmaps it if the pool is full.
 void GiveToPool(FreeBlock block) {
   {
     const std::lock_guard lock(pool.mutex);
@@ -120,9 +118,8 @@ void GiveToPool(FreeBlock block) {
   Unmap(block);
 }
 
-// Fresh zero pages, asked to be huge ones where the block is worth it. What waits in the pool and
-// did not fit counts against what the pool may hold, so that one large picture after many small
-// ones does not have both.
+// Maps fresh zero pages, huge ones if the block is large enough. Pooled blocks that did not fit are
+// freed to make room, so that one large picture after many small ones does not add to them.
 FreeBlock MapFresh(uint64_t capacity) {
   ShrinkPool(kPooledBytes - std::min(capacity, kPooledBytes));
   void* data = mmap(nullptr, static_cast<size_t>(capacity), PROT_READ | PROT_WRITE,

@@ -18,7 +18,7 @@ namespace fotomill::platform {
 
 namespace {
 
-// Read by signal handlers on the thread itself, and trivial to destroy, so that it is still there
+// Read by signal handlers on the same thread; trivially destructible, so that it is still valid
 // when exit() runs its handlers.
 constinit thread_local const ModuleRisk* current = nullptr;
 
@@ -29,7 +29,7 @@ void WriteLine(int file, const std::string& line) {
   if (write(file, line.data(), line.size()) < 0 || write(file, "\n", 1) < 0) return;
 }
 
-// Only calls that are allowed in signal handlers.
+// Async-signal-safe calls only.
 void SayFarewell(const ModuleRisk& risk) {
   WriteLine(STDERR_FILENO, risk.message);
   DeleteListedTemporaries();
@@ -43,8 +43,8 @@ void SayFarewell(const ModuleRisk& risk) {
 
 void OnCrash(int signalNumber, siginfo_t* info, void* context);
 
-// Whether the handler that was there before could repair the access. One that cannot puts its own
-// predecessor in its place.
+// Whether the previous handler could repair the access. If it cannot, it reinstalls
+// its own predecessor.
 bool RepairedBefore(size_t index, siginfo_t* info, void* context) {
   const struct sigaction& before = previous[index];
   if ((before.sa_flags & SA_SIGINFO) == 0 || before.sa_sigaction == nullptr) return false;

@@ -20,7 +20,7 @@ struct TypeRow {
   DriveKind kind;
 };
 
-// File system types whose kind does not depend on a device.
+// File system types whose kind is independent of the device.
 // clang-format off
 constexpr TypeRow typeRows[] = {
     {"nfs", DriveKind::Network},         {"nfs4", DriveKind::Network},           {"cifs", DriveKind::Network},
@@ -44,7 +44,7 @@ int HexDigit(char c) {
 
 bool IsOctalDigit(char c) { return c >= '0' && c <= '7'; }
 
-// "\040" is a blank in the mount table.
+// In the mount table, "\040" is a blank.
 std::string DecodeOctal(std::string_view text) {
   std::string result;
   for (size_t i = 0; i < text.size(); ++i) {
@@ -60,7 +60,7 @@ std::string DecodeOctal(std::string_view text) {
   return result;
 }
 
-// "\x20" is a blank in the names below /dev/disk.
+// In names below /dev/disk, "\x20" is a blank.
 std::string DecodeHex(std::string_view text) {
   std::string result;
   for (size_t i = 0; i < text.size(); ++i) {
@@ -81,7 +81,7 @@ std::string LinkTarget(const std::string& path) {
   return length > 0 ? std::string(target, static_cast<size_t>(length)) : std::string();
 }
 
-// The kernel's name of the device below a mount ("sda1"), empty if there is none.
+// The kernel name of a mount's device ("sda1"), empty if there is none.
 std::string DeviceName(const Mount& mount, const std::string& root) {
   const std::string known = LinkTarget(root + "/sys/dev/block/" + mount.device);
   if (!known.empty()) return std::string(FileNameOf(known));
@@ -91,7 +91,7 @@ std::string DeviceName(const Mount& mount, const std::string& root) {
   return std::string(FileNameOf(real != nullptr ? real.get() : mount.source));
 }
 
-// The name in a folder of links, decoded, whose link leads to the device; empty if there is none.
+// The decoded name of the link in a folder that points to the device; empty if there is none.
 std::string NameAmong(const std::string& folder, const std::string& device) {
   const auto entries = ListFolder(folder);
   if (!entries || device.empty()) return {};
@@ -102,9 +102,8 @@ std::string NameAmong(const std::string& folder, const std::string& device) {
   return {};
 }
 
-// A 32-bit number from the identity that a file system carries: "1A2B-3C4D" of FAT and exFAT is
-// that number, of NTFS's 16 digits it is the lower half, as Windows shows them. Longer ones are
-// folded (FNV-1a).
+// A 32-bit serial number from a file system's id: for FAT and exFAT, "1A2B-3C4D" is that number;
+// for NTFS it is the lower half of the 16 digits, as on Windows. Longer ids are hashed (FNV-1a).
 uint32_t SerialFrom(std::string_view identity) {
   uint64_t number = 0;
   size_t digits = 0;
@@ -126,12 +125,12 @@ DriveKind KindFrom(const Mount& mount, const std::string& device, const std::str
   if (row != std::end(typeRows) && (device.empty() || row->kind != DriveKind::Fixed))
     return row->kind;
   if (device.empty()) return DriveKind::Unknown;
-  // SCSI and SATA drives for disks of light
+  // major number 11: SCSI and SATA optical drives
   if (mount.device.starts_with("11:")) return DriveKind::Optical;
   if (mount.device.starts_with("1:")) return DriveKind::Ram;
   const std::string folder = root + "/sys/class/block/" + device;
   std::string flag;
-  for (const char* name : {"/removable", "/../removable"}) {  // a partition's flag is its disk's
+  for (const char* name : {"/removable", "/../removable"}) {  // partitions have it on their disk
     if (ReadWholeFile(folder + name, 4096, flag) == ReadResult::Done) break;
   }
   return flag.starts_with('1') ? DriveKind::Removable : DriveKind::Fixed;

@@ -33,8 +33,8 @@ namespace {
 constexpr int kAttempts = 100;
 constexpr size_t kCopyStep = size_t{1} << 30;
 
-// ".fmw-OWNER-N.tmp" beside the destination: hidden, short, and unique within this machine and
-// process.
+// ".fmw-OWNER-N.tmp" in the destination's folder: hidden, short, and unique within this
+// machine and process.
 std::string TemporarySibling(const std::string& path) {
   static std::atomic<unsigned> counter{0};
   char name[64];
@@ -42,7 +42,7 @@ std::string TemporarySibling(const std::string& path) {
   return JoinFolder(SplitPath(path).folder, name);
 }
 
-// The name under which the system leads to an open file, whatever its own is.
+// A path that refers to an open file, even an unnamed one.
 std::string HandlePath(int handle) { return "/proc/self/fd/" + std::to_string(handle); }
 
 Handle OpenUnnamed(const std::string& folder, mode_t mode) {
@@ -67,8 +67,8 @@ bool CloseCopyOf(int handle) {
   return copy.IsOpen() && copy.Reset();
 }
 
-// Whether a link may be replaced: one to a regular file, or to nothing. Others are the system's or
-// stand for a place, and so do those that name an open file, as /dev/stdout does.
+// Whether a link may be replaced: one to a regular file, or a dangling one. Others belong to the
+// system or stand for a location, as do links to an open file such as /dev/stdout.
 bool MayReplaceLink(const std::string& path) {
   constexpr std::string_view kOpenFiles = "/proc/";
   char target[kOpenFiles.size()];
@@ -81,8 +81,8 @@ bool MayReplaceLink(const std::string& path) {
   return replaceable;
 }
 
-// Whether `path` may become a file: free, a link that may be replaced, or a regular file that may
-// be written to, whose permissions then go to `mode`. False with errno.
+// Whether `path` may be written: it does not exist, is a link that may be replaced, or is a
+// writable regular file, whose permissions are returned in `mode`. False with errno.
 bool MayBecome(const std::string& path, mode_t& mode) {
   struct stat facts;
   if (lstat(path.c_str(), &facts) != 0) return errno == ENOENT;
@@ -95,7 +95,7 @@ bool MayBecome(const std::string& path, mode_t& mode) {
   return faccessat(AT_FDCWD, path.c_str(), W_OK, AT_EACCESS) == 0;
 }
 
-// The nearest folder of a path that is there, or what is there in place of one.
+// The nearest existing ancestor of a path, even if it is not a folder.
 std::string FolderThatExists(std::string path) {
   struct stat facts;
   do {
@@ -141,7 +141,7 @@ bool OutputFile::Create(const std::string& path) {
     KeepErrno();
     return false;
   }
-  flock(handle_, LOCK_EX | LOCK_NB);  // tells other runs that its name is not a killed one's
+  flock(handle_, LOCK_EX | LOCK_NB);  // tells other instances that it is not stale
   return true;
 }
 
@@ -204,7 +204,7 @@ CommitResult OutputFile::Commit(Existing existing, bool sync) {
   return result;
 }
 
-// Makes the sibling the file. `synced` is set when that turned out to need it.
+// Renames the temporary file to its name. `synced` is set if that required a sync.
 CommitResult OutputFile::TakeName(Existing existing, bool replaces, bool& synced) {
   FileStamp expected;
   const bool held = existing == Existing::Replace && HeldFile::Find(path_, expected);
@@ -224,7 +224,7 @@ CommitResult OutputFile::TakeName(Existing existing, bool replaces, bool& synced
     return std::rename(temporary_.c_str(), path_.c_str()) == 0 ? CommitResult::Done
                                                                : CommitResult::Failed;
   }
-  LeaveTemporaryName(listed_);  // it may soon be the name of what another program has written
+  LeaveTemporaryName(listed_);  // by now it may hold what another program has written
   listed_ = -1;
   bool keep = false;
   const CommitResult result = ReplaceExpected(temporary_, path_, expected, keep);
@@ -232,7 +232,7 @@ CommitResult OutputFile::TakeName(Existing existing, bool replaces, bool& synced
   return result == CommitResult::Taken ? SayChanged(path_) : result;
 }
 
-// Gives an unnamed sibling a temporary name.
+// Gives an unnamed file a temporary name.
 bool OutputFile::NameSibling() {
   if (FaultDue()) return false;
   DeleteStaleFiles(OpenableFolderOf(path_));
@@ -248,7 +248,7 @@ bool OutputFile::NameSibling() {
   return CopySibling();
 }
 
-// The system made an unnamed file and will not name it: its contents go to one that has a name.
+// The system created an unnamed file but cannot link it: copies the contents to a named one.
 bool OutputFile::CopySibling() {
   struct stat facts;
   if (fstat(handle_, &facts) != 0) return false;

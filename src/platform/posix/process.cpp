@@ -46,7 +46,7 @@ bool IsProgram(const std::string& path) {
   return IsRegularFile(path) && access(path.c_str(), X_OK) == 0;
 }
 
-// The file of a program given by name or path; empty if there is none.
+// The path of a program given by name or path; empty if there is none.
 std::string FindProgram(const std::string& name) {
   if (name.find('/') != std::string::npos) return IsProgram(name) ? name : std::string();
   const char* path = std::getenv("PATH");
@@ -68,7 +68,7 @@ int WaitFor(pid_t child) {
   return status;
 }
 
-// posix_spawn's two attribute objects, freed with their owner.
+// posix_spawn's two attribute objects.
 struct SpawnSettings {
   posix_spawn_file_actions_t actions;
   posix_spawnattr_t attributes;
@@ -92,9 +92,9 @@ struct SpawnSettings {
 }  // namespace
 
 std::vector<std::string> ProgramFor(const std::string& file) {
-  std::string opener = FindProgram("xdg-open");  // asks the desktop for the file type's own program
+  std::string opener = FindProgram("xdg-open");  // opens with the desktop's default program
   if (opener.empty()) return {};
-  // absolute: a name may begin with "-" or read like an address
+  // absolute, as a name may start with "-" or look like a URL
   return {std::move(opener), AbsolutePath(file)};
 }
 
@@ -117,7 +117,7 @@ bool RunProgram(const std::vector<std::string>& arguments, bool wait) {
     return true;
   }
   try {
-    std::thread(WaitFor, child).detach();  // so that it does not stay a zombie
+    std::thread(WaitFor, child).detach();  // reaps the child
   } catch (const std::system_error&) {
   }
   return true;
@@ -125,8 +125,7 @@ bool RunProgram(const std::vector<std::string>& arguments, bool wait) {
 
 void FillStandardStreams() {
   for (const int stream : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO}) {
-    // A file for reading gets the lowest free number, and whoever writes there is told that it
-    // failed.
+    // The lowest free descriptor is used. It is read-only, so that writes to it fail.
     if (fcntl(stream, F_GETFD) < 0) (void)open("/dev/null", O_RDONLY);
   }
 }
@@ -146,7 +145,7 @@ bool IsStored(int stream) {
 }
 
 bool WaitForInput() {
-  constexpr int kPatienceMs = 100;  // a signal between the question and the wait is seen after it
+  constexpr int kPatienceMs = 100;  // limits the delay of a signal that arrives just before poll()
   pollfd input = {STDIN_FILENO, POLLIN, 0};
   while (PendingExit() == 0) {
     if (poll(&input, 1, kPatienceMs) > 0) return true;

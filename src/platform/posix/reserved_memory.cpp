@@ -22,7 +22,7 @@ bool ReservedMemory::Reserve(uint64_t size) {
                     MAP_PRIVATE | MAP_ANONYMOUS | MAP_NORESERVE, -1, 0);
   if (data == MAP_FAILED) return false;
 #ifdef MADV_NOHUGEPAGE
-  madvise(data, bytes, MADV_NOHUGEPAGE);  // one touched byte would take two megabytes
+  madvise(data, bytes, MADV_NOHUGEPAGE);  // otherwise touching one byte takes 2 MB
 #endif
   Free();
   data_ = static_cast<uint8_t*>(data);

@@ -20,8 +20,8 @@ const char* const kModuleExtension = ".so";
 
 namespace {
 
-// Everything is bound now, so that a missing symbol fails here and not inside a picture; nothing of
-// it serves others.
+// Binds all symbols now, so that a missing one fails here and not while decoding; exports none of
+// them to others.
 void* Open(const char* name, std::string& error, int flags = 0) {
   if (FaultDue()) {
     error = "cannot be loaded";
@@ -41,14 +41,14 @@ bool ReadAt(const Handle& file, uint64_t offset, Struct& read) {
          static_cast<ssize_t>(sizeof read);
 }
 
-// Whether `count` items of `size` bytes from `offset` on end within the file.
+// Whether `count` items of `size` bytes at `offset` are within the file.
 bool Holds(uint64_t fileSize, uint64_t offset, uint64_t count, uint64_t size) {
   return offset <= fileSize && (size == 0 || count <= (fileSize - offset) / size);
 }
 
-// Whether the file holds every byte that its headers speak of. The system maps a library without
-// looking: one that is cut off, as an interrupted copy is, ends the program at the first access
-// behind its end. What is no library at all is left to the system to refuse.
+// Whether the file contains everything its headers refer to. The loader does not check: a library
+// truncated by an interrupted copy crashes the program when code past its end is accessed. Files
+// that are not libraries are left for the loader to reject.
 bool IsWhole(const std::string& path) {
   struct stat facts;
   const Handle file = OpenRegular(path.c_str(), O_RDONLY, facts);
@@ -106,8 +106,8 @@ bool SharedLibrary::LoadSystem(const std::string& name) {
   if (name.empty() || name.find('/') != std::string::npos) {
     error_ = "not a bare name";
   } else {
-    // It stays until the program ends: what such a library keeps for itself is not lost, and
-    // nothing of it is called after it went.
+    // Stays loaded until the program ends: its global state is kept, and none of its code is called
+    // after unloading.
     handle_ = Open(name.c_str(), error_, RTLD_NODELETE);
   }
   return Loaded();

@@ -23,15 +23,15 @@ namespace fotomill::platform {
 
 namespace {
 
-// Process numbers say nothing in another space of them, as a container with the same temporary
-// folder has.
+// Process ids mean nothing in another PID namespace, such as a container that shares
+// the temporary folder.
 unsigned ProcessSpace() {
   struct stat facts;
   return stat("/proc/self/ns/pid", &facts) == 0 ? static_cast<unsigned>(facts.st_ino & 0xFFFF) : 0;
 }
 
-// Whether a name is a temporary one of a process that has ended: ".fmw-PID-SPACE-N.tmp",
-// "FMWTPID-SPACE-N.EXT".
+// Whether a temporary name belongs to a process that has ended:
+// ".fmw-PID-SPACE-N.tmp", "FMWTPID-SPACE-N.EXT".
 bool IsOfEndedProcess(const char* name) {
   unsigned process = 0, space = 0;
   char separator = 0;
@@ -43,7 +43,7 @@ bool IsOfEndedProcess(const char* name) {
          kill(static_cast<pid_t>(process), 0) != 0 && errno == ESRCH;
 }
 
-// Deletes a temporary folder of this user, with all that is in it. False if `path` is none.
+// Deletes one of this user's temporary folders with its contents. False if `path` is not one.
 bool DeletedFolder(const std::string& path) {
   struct stat facts;
   if (lstat(path.c_str(), &facts) != 0 || !S_ISDIR(facts.st_mode) || facts.st_uid != geteuid())

@@ -4,13 +4,13 @@
 
 namespace fotomill::platform {
 
-// Deletes the working files in a folder that a killed run of this program left: its own temporary
-// names, of a process of this user that is not there any more, which no one has locked. Once for
-// each folder in a run.
+// Deletes temporary files in a folder left by a killed instance
+// of this program: by name, of this user, with a process that
+// no longer exists, and not locked. Once per folder and run.
 void DeleteStaleFiles(const std::string& folder);
 
-// The part of a temporary name that tells whose it is: the process, and the space in which its
-// number counts.
+// The part of a temporary name that identifies its
+// process: the process id and its PID namespace.
 std::string OwnerOfTemporary();
 
 }  // namespace fotomill::platform

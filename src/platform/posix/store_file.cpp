@@ -28,14 +28,14 @@ namespace {
 
 constexpr std::chrono::microseconds kFirstPause{100};
 constexpr std::chrono::microseconds kLongestPause{10'000};
-constexpr std::chrono::seconds kSilentWait{2};   // then whose lock it is gets told
+constexpr std::chrono::seconds kSilentWait{2};   // before the lock's holder is reported
 constexpr std::chrono::seconds kLongestWait{10};
-// a byte that no file has, for the lock that says it is in use
+// offset beyond any file's end, for the "in use" lock
 constexpr off_t kUseMark = off_t{1} << 62;
 
-// Whether an open failed because there is nothing of that name. A link that leads nowhere is
-// something; a file that has come since then is not asked for, or who creates and removes files
-// side by side would meet errors that are none.
+// Whether an open failed because the name does not exist. A dangling link does exist. A
+// file created since then is not considered, as concurrent creation and deletion would
+// cause spurious errors.
 bool IsNoName(const std::string& path, int error) {
   struct stat facts;
   return (error == ENOENT || error == ENOTDIR) &&
@@ -123,7 +123,7 @@ bool StoreFile::ReadAt(uint64_t offset, std::span<uint8_t> first, std::span<uint
   if (preadv(static_cast<int>(handle_), parts, 2, static_cast<off_t>(offset)) ==
       static_cast<ssize_t>(size))
     return true;
-  // it was interrupted, or the file ends there
+  // short read: interrupted, or at the end of the file
   return ReadAt(offset, first) && ReadAt(offset + first.size(), second);
 }
 
@@ -136,13 +136,13 @@ bool StoreFile::WriteAt(uint64_t offset, std::span<const uint8_t> first,
   if (pwritev(static_cast<int>(handle_), parts, 2, static_cast<off_t>(offset)) ==
       static_cast<ssize_t>(size))
     return true;
-  // it was interrupted, or there is no room
+  // short write: interrupted, or the disk is full
   return WriteAt(offset, first) && WriteAt(offset + first.size(), second);
 }
 
 bool StoreFile::Sync() { return IsOpen() && !FaultDue() && SyncHandle(static_cast<int>(handle_)); }
 
-// Asks again and again instead of waiting inside the system, so that Ctrl-C is heard.
+// Polls instead of blocking in the kernel, so that Ctrl-C works.
 bool StoreFile::Lock() {
   ForgetReason();
   if (!IsOpen() || FaultDue()) return false;
@@ -178,8 +178,7 @@ bool StoreFile::Resize(uint64_t size) {
          ftruncate(static_cast<int>(handle_), static_cast<off_t>(size)) == 0;
 }
 
-// Locks of ranges are other locks than the one on the whole file, and end with the open file as
-// that does.
+// A byte-range lock, independent of the lock on the whole file; it ends with the open file, too.
 bool StoreFile::MarkInUse() {
   struct flock range = {};
   range.l_type = F_RDLCK;

@@ -33,11 +33,11 @@ bool CreateExclusively(const std::string& path) {
   return OpenHandle(path.c_str(), O_RDWR | O_CREAT | O_EXCL | O_NOFOLLOW, 0600).IsOpen();
 }
 
-// A name that is hardly taken; creating the file decides.
+// A name that is most likely free; creating the file decides.
 std::string RandomName(std::string_view extension) {
   static std::atomic<uint32_t> counter{0};
   uint32_t number = ++counter;
-  if (getentropy(&number, sizeof number) != 0) errno = 0;  // then the counter has to do
+  if (getentropy(&number, sizeof number) != 0) errno = 0;  // the counter alone has to do
   char digits[16];
   std::snprintf(digits, sizeof digits, "-%08x", number);
   return ("FMWT" + OwnerOfTemporary()).append(digits).append(extension);

@@ -17,7 +17,7 @@ struct Slot {
   std::atomic<int> state{Free};
   char name[kLongestName] = {};
 };
-constinit Slot slots[64];  // no pages are touched before a name is entered
+constinit Slot slots[64];  // zero-initialized: no pages are touched until a name is added
 static_assert(std::atomic<int>::is_always_lock_free,
               "the handler may only touch lock-free objects");
 

@@ -4,15 +4,15 @@
 
 namespace fotomill::platform {
 
-// Names of files that must not outlive the program, for the moment when a second Ctrl-C ends it
-// without the owners being asked. The table is fixed and may be walked inside a signal handler;
-// what does not fit into it is simply not listed.
+// Names of files to delete when a second Ctrl-C ends the program without running destructors.
+// The table has a fixed size and is safe to read in a signal handler; names that do not fit
+// are not listed.
 
-// Lists a file that this process has just created. The number is for LeaveTemporaryName; -1 when
+// Lists a file that this process has just created. Returns the number for LeaveTemporaryName; -1 if
 // the table is full.
 int EnterTemporaryName(const std::string& path);
 void LeaveTemporaryName(int number);
-// Deletes what is listed. For signal handlers and nothing else.
+// Deletes all listed files. For signal handlers only.
 void DeleteListedTemporaries();
 
 }  // namespace fotomill::platform

@@ -1,15 +1,16 @@
-// The trash as desktops share it. A trash folder holds
+// The freedesktop.org trash. A trash folder contains
 //
-//   files/NAME            what was deleted, under a name that is free there
-//   info/NAME.trashinfo   where it came from and when:
+//   files/NAME            the deleted file, under a name that is unique there
+//   info/NAME.trashinfo   its original path and deletion time:
 //
 //       [Trash Info]
-//       Path=/home/user/a%20picture.bmp       percent-encoded; in a volume's own trash relative to
-//       the volume's top folder DeletionDate=2004-08-31T22:32:08      local time
+//       Path=/home/user/a%20picture.bmp     percent-encoded; in a volume's own trash relative
+//                                           to the volume's top folder
+//       DeletionDate=2004-08-31T22:32:08    local time
 //
-// Files of the home folder's device go to $XDG_DATA_HOME/Trash, others to TOP/.Trash/UID (which the
-// administrator made, with the sticky bit) or TOP/.Trash-UID of their volume. The info file is
-// created first, exclusively; it holds the name. The size cache of folders ("directorysizes") is
+// Files on the home folder's device go to $XDG_DATA_HOME/Trash, others to TOP/.Trash/UID (made by
+// the administrator, with the sticky bit) or TOP/.Trash-UID on their volume. The info file is
+// created first, exclusively, to reserve the name. The size cache of folders ("directorysizes") is
 // optional and left to the desktops. Source: freedesktop.org, "The FreeDesktop.org Trash
 // specification", version 1.0.
 
@@ -35,12 +36,12 @@ namespace fotomill::platform {
 
 namespace {
 
-constexpr int kAttempts = 10'000;     // names tried for one file
-// bytes kept of a long name; number, extension and ".trashinfo" follow
+constexpr int kAttempts = 10'000;     // names tried per file
+// bytes kept of a long name, before number, extension and ".trashinfo"
 constexpr size_t kLongestBase = 200;
 constexpr size_t kLongestExtension = 24;
 
-// What is to go: its folder without links and its own name.
+// The file to delete: its folder with links resolved, and its name.
 struct Victim {
   std::string folder;
   std::string name;
@@ -48,14 +49,14 @@ struct Victim {
   std::string Path() const { return JoinFolder(folder, name); }
 };
 
-// A trash folder for a victim and the path by which its info file remembers it.
+// A trash folder for a file and the path to record in the info file.
 struct Place {
   std::string folder;
   std::string remembered;
-  bool shared = false;  // is on a volume that others may write to: must be ours and no link
+  bool shared = false;  // on a volume others may write to: must be owned by us and not a link
 };
 
-// Folders made on the way, taken away again unless the work succeeds.
+// Newly created folders, removed again unless the operation succeeds.
 class MadeFolders {
  public:
   ~MadeFolders() {
@@ -104,7 +105,7 @@ std::string HomeTrash() {
   return home.empty() ? home : JoinFolder(home, ".local/share/Trash");
 }
 
-// The nearest folder on the way up that is there; "/" at last.
+// The nearest existing ancestor folder, at last "/".
 std::string NearestFolder(std::string path) {
   while (path.size() > 1 && !IsFolder(path)) path = AbsolutePath(path + "/..");
   return path;
@@ -115,7 +116,7 @@ bool IsOnDevice(const std::string& path, dev_t device) {
   return stat(path.c_str(), &facts) == 0 && facts.st_dev == device;
 }
 
-// The top folder of the volume that a folder without links is on.
+// The mount point of the volume of a folder without links.
 std::string TopFolder(std::string folder, dev_t device) {
   while (folder.size() > 1) {
     std::string above = AbsolutePath(folder + "/..");
@@ -130,7 +131,7 @@ bool IsOwnFolder(const std::string& path) {
   return lstat(path.c_str(), &facts) == 0 && S_ISDIR(facts.st_mode) && facts.st_uid == getuid();
 }
 
-// Where the victim may go, in the order of preference.
+// Possible trash folders for a file, in order of preference.
 std::vector<Place> PlacesFor(const Victim& victim) {
   const std::string home = HomeTrash();
   if (!home.empty() && IsOnDevice(NearestFolder(home), victim.device))
@@ -174,8 +175,8 @@ std::string InfoText(const std::string& remembered) {
   return "[Trash Info]\nPath=" + PercentEncoded(remembered) + "\nDeletionDate=" + date + "\n";
 }
 
-// The name tried at an attempt: the file's own, then "picture.2.bmp" and so on. Very long names are
-// shortened, their whole name is in the info file.
+// The name to try: the original, then "picture.2.bmp" and so on. Very long names are shortened; the
+// full name is in the info file.
 std::string NameInTrash(const std::string& name, int attempt) {
   const PathParts parts = SplitPath(name);
   const std::string_view extension = parts.extension.substr(0, kLongestExtension);
@@ -184,7 +185,7 @@ std::string NameInTrash(const std::string& name, int attempt) {
   return result.append(extension);
 }
 
-// Takes a name by creating its info file: Done, Taken or Failed (then nothing is left of it).
+// Reserves a name by creating its info file: Done, Taken or Failed (no leftovers).
 CommitResult CreateInfo(const std::string& path, const std::string& text) {
   if (FaultDue()) return CommitResult::Failed;
   Handle handle = OpenHandle(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW, 0600);
@@ -225,8 +226,7 @@ bool MoveTo(const Place& place, const Victim& victim) {
   return false;
 }
 
-// The name in a trash folder of what was deleted from the remembered path last; empty when there is
-// nothing of it.
+// The name in a trash folder of what was last deleted from that path; empty if there is none.
 std::string FindInTrash(const Place& place, const std::string& ownName) {
   constexpr std::string_view kInfo = ".trashinfo";
   constexpr uint64_t kLongestInfo = 64 * 1024;

@@ -23,7 +23,7 @@ namespace {
 
 constexpr uint64_t kLongestMountTable = uint64_t{16} << 20;
 
-// `path` where it is there, else its folder.
+// `path` if it exists, else its folder.
 std::string NearestFile(const std::string& path) {
   if (FactsOf(path).kind != FileKind::Missing) return path;
   const std::string folder(SplitPath(path).folder);
@@ -61,7 +61,7 @@ Volume AskSystem(const std::string& path) {
     const bool holdsFile = idKnown ? mount.id == facts.stx_mnt_id : mount.device == device;
     if (holdsFile) return DescribeMount(mount, volume.serial, "");
   }
-  // below a changed root the table lacks the volume that the root is on
+  // with a changed root, the table lacks the root's own volume
   volume.kind = DriveKind::Fixed;
   return volume;
 }

@@ -27,10 +27,10 @@
 #include "platform/posix/handle.h"
 #include "platform/process.h"
 
-// A process apart is this program with the argument kServe and the number of its parent. Orders
-// come over a socket, which is its only connection: an OrderHead with the request behind it, and
-// the handles of input and reply. It answers with Words, the last of which says how the work ended.
-// The end of the socket is its own end.
+// A worker process is this program started with the argument kServe and its parent's process id.
+// Requests arrive on a socket, its only connection: an OrderHead, the request, and the handles of
+// input and reply. It answers with Words, the last of which carries the result. It exits when the
+// socket is closed.
 
 extern char** environ;
 
@@ -39,7 +39,7 @@ namespace fotomill::platform {
 namespace {
 
 constexpr const char* kServe = "--work-apart";
-constexpr int kSocket = 3;  // in the process apart
+constexpr int kSocket = 3;  // in the worker process
 constexpr int kPatienceMs = 100;
 constexpr int kClockFactor = 10;
 constexpr size_t kMostIdle = 16;  // processes
@@ -53,21 +53,21 @@ struct OrderHead {
 
 struct Word {
   enum Kind : int32_t { Told, Ended } kind = Told;
-  int32_t value = 0;  // of Ended: whether the answer was true
+  int32_t value = 0;  // of Ended: whether the task returned true
 };
 
 bool servesItself = false;
 
-// --- in the process apart ---
+// --- in the worker process ---
 
-// What a crash must not set off: files and texts that it writes about itself.
+// No core dumps, no writing to files; ends with its parent.
 bool PrepareProcess(const char* parent) {
   prctl(PR_SET_PDEATHSIG, SIGKILL);
   if (std::to_string(getppid()) != parent) return false;
   const rlimit none = {0, 0};
   setrlimit(RLIMIT_CORE, &none);
   setrlimit(RLIMIT_FSIZE, &none);
-  // the program decides what becomes of its work
+  // the parent decides when to stop
   for (const int number : {SIGINT, SIGTERM}) std::signal(number, SIG_IGN);
   return true;
 }
@@ -81,10 +81,10 @@ void LimitTime(unsigned seconds) {
   setrlimit(RLIMIT_CPU, &limit);
 }
 
-// To so much beside what is mapped now.
+// Limits memory to that much beyond what is mapped now.
 void LimitMemory(uint64_t bytes) {
 #ifdef __SANITIZE_ADDRESS__
-  (void)bytes;  // its shadow is larger than any limit
+  (void)bytes;  // the sanitizer's shadow memory exceeds any limit
 #else
   unsigned long pages = 0;
   if (const Handle file(open("/proc/self/statm", O_RDONLY | O_CLOEXEC)); file.IsOpen()) {
@@ -106,7 +106,7 @@ void FreeMemoryLimit() {
   setrlimit(RLIMIT_AS, &limit);
 }
 
-// A block of the caller, for the time of one order.
+// Maps a block of the caller for one request.
 class Mapping {
  public:
   Mapping(int handle, uint64_t size, int protection) : size_(static_cast<size_t>(size)) {
@@ -151,7 +151,7 @@ bool DoOrder(const OrderHead& head, std::span<const uint8_t> request, int input,
   return done;
 }
 
-// The next order with its handles; false at the end of the socket.
+// The next request with its handles; false when the socket is closed.
 bool Receive(std::vector<uint8_t>& message, std::array<int, 2>& handles) {
   message.resize(sizeof(OrderHead) + kMostRequest);
   alignas(cmsghdr) std::array<char, CMSG_SPACE(sizeof handles)> control{};
@@ -187,7 +187,7 @@ int Serve(std::span<const ApartTask> tasks) {
   return 0;
 }
 
-// --- in the program ---
+// --- in the parent ---
 
 struct Process {
   pid_t id = -1;
@@ -195,9 +195,9 @@ struct Process {
 
   bool Lives() const {
     pollfd state = {socket.Number(), POLLIN, 0};
-    return poll(&state, 1, 0) == 0;  // an idle one says nothing
+    return poll(&state, 1, 0) == 0;  // an idle process sends nothing
   }
-  // Ends it, unless it has ended, and has the system forget it.
+  // Kills it unless it has ended, and reaps it.
   void End() {
     kill(id, SIGKILL);
     while (waitpid(id, nullptr, 0) < 0 && errno == EINTR) {
@@ -206,7 +206,7 @@ struct Process {
   }
 };
 
-// Processes that wait for an order. They go with the program.
+// Idle worker processes, ended with the program.
 class IdleProcesses {
  public:
   ~IdleProcesses() { EndAll(); }
@@ -255,7 +255,7 @@ bool StartProcess(Process& process) {
     posix_spawn_file_actions_addopen(&actions, stream, "/dev/null", O_WRONLY, 0);
   posix_spawn_file_actions_adddup2(&actions, other.Number(), kSocket);
   posix_spawn_file_actions_addclosefrom_np(&actions, kSocket + 1);
-  posix_spawnattr_setflags(&attributes, POSIX_SPAWN_SETPGROUP);  // Ctrl-C is for the program
+  posix_spawnattr_setflags(&attributes, POSIX_SPAWN_SETPGROUP);  // Ctrl-C goes to the parent only
   const std::string parent = std::to_string(getpid());
   std::string name = "fotomill", serve = kServe, number = parent;
   char* const arguments[] = {name.data(), serve.data(), number.data(), nullptr};
@@ -274,7 +274,7 @@ bool SendOrder(const Process& process, const ApartOrder& order, const SharedBloc
   head.memory = order.memory;
   head.inputSize = order.input.size();
   head.replySize = order.reply.Bytes().size();
-  // Both are sent always; of an empty input the process makes nothing.
+  // Both are always sent; the worker ignores an empty input.
   const std::array<int, 2> handles = {
       static_cast<int>(order.input.empty() ? order.reply.SystemHandle() : input.SystemHandle()),
       static_cast<int>(order.reply.SystemHandle())};
@@ -321,7 +321,7 @@ SharedBlock::~SharedBlock() {
 bool SharedBlock::Allocate(uint64_t size) {
   if (FaultDue() || size == 0 || data_ != nullptr) return false;
   Handle memory(memfd_create("fotomill", MFD_CLOEXEC | MFD_ALLOW_SEALING));
-  // Nobody who has it may shorten it: touching what is gone would end this process.
+  // Sealed against shrinking: accessing a truncated mapping would crash this process.
   if (!memory.IsOpen() || ftruncate(memory.Number(), static_cast<off_t>(size)) != 0) return false;
   (void)fcntl(memory.Number(), F_ADD_SEALS, F_SEAL_SHRINK | F_SEAL_GROW | F_SEAL_SEAL);
   void* data = mmap(nullptr, static_cast<size_t>(size), PROT_READ | PROT_WRITE, MAP_SHARED,
