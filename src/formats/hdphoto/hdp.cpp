@@ -20,6 +20,7 @@
 #include "core/limits.h"
 #include "formats/hdphoto/hdp_codec.h"
 #include "formats/hdphoto/hdp_file.h"
+#include "formats/metadata_blocks.h"
 #include "picture/gray_palette.h"
 #include "platform/file_view.h"
 
@@ -233,24 +234,16 @@ int32_t BitsOf(const HdpPage& page) {
                                                                                               : 8;
 }
 
-void Assign(std::vector<uint8_t>& block, std::span<const uint8_t> data) {
-  block.clear();
-  if (data.size() <= limits.metadataBytes) block.assign(data.begin(), data.end());
-}
-
 void TakeMetadata(std::span<const uint8_t> file, const HdpPage& page, PictureRecord& picture) {
   PictureMetadata& metadata = picture.metadata;
   metadata = {};
   metadata.exif = HdpExifBlock(file, page);
-  Assign(metadata.xmp, page.xmp);
-  Assign(metadata.icc, page.icc);
+  TakeBlock(page.xmp, metadata.xmp);
+  TakeBlock(page.icc, metadata.icc);
   const auto end = std::find(page.description.begin(), page.description.end(), uint8_t{0});
-  Assign(picture.comment,
-         page.description.first(static_cast<size_t>(end - page.description.begin())));
-  if (page.dpiX > 0 && page.dpiY > 0 && std::isfinite(page.dpiX) && std::isfinite(page.dpiY)) {
-    metadata.dpiX = page.dpiX;
-    metadata.dpiY = page.dpiY;
-  }
+  TakeBlock(page.description.first(static_cast<size_t>(end - page.description.begin())),
+            picture.comment);
+  TakeResolution(page.dpiX, page.dpiY, metadata);
 }
 
 Status Describe(std::span<const uint8_t> file, int32_t index, HdpPage& page,

@@ -28,6 +28,7 @@
 #include "containers/png_chunks.h"
 #include "core/byte_reader.h"
 #include "core/limits.h"
+#include "formats/metadata_blocks.h"
 #include "formats/png/png_library.h"
 #include "formats/png/png_pixels.h"
 #include "formats/png/png_text.h"
@@ -162,11 +163,6 @@ void TakePalette(const PngReader& reader, const PngLayout& layout, Palette& pale
   palette = GrayLevels(layout.bitsPerPixel);
 }
 
-void Assign(std::vector<uint8_t>& block, const uint8_t* data, size_t size) {
-  block.clear();
-  if (data != nullptr && size <= limits.metadataBytes) block.assign(data, data + size);
-}
-
 // The two texts that travel with a picture, the last of each name; no others are inflated.
 void TakeTexts(std::span<const uint8_t> file, PictureRecord& picture) {
   PngChunks chunks(file);
@@ -186,20 +182,19 @@ void TakeMetadata(const PngReader& reader, PictureRecord& picture) {
   png_bytep exif = nullptr;
   png_uint_32 exifSize = 0;
   if (png_get_eXIf_1(reader.png, reader.info, &exifSize, &exif) != 0)
-    Assign(picture.metadata.exif, exif, exifSize);
+    TakeBlock({exif, exifSize}, picture.metadata.exif);
   png_charp name = nullptr;
   int method = 0;
   png_bytep profile = nullptr;
   png_uint_32 profileSize = 0;
   if (png_get_iCCP(reader.png, reader.info, &name, &method, &profile, &profileSize) != 0) {
-    Assign(picture.metadata.icc, profile, profileSize);
+    TakeBlock({profile, profileSize}, picture.metadata.icc);
   }
   TakeTexts(reader.file, picture);
   png_uint_32 x = 0, y = 0;
   int unit = 0;
   if (png_get_pHYs(reader.png, reader.info, &x, &y, &unit) != 0 && unit == PNG_RESOLUTION_METER) {
-    picture.metadata.dpiX = x / kPngInchesPerMetre;
-    picture.metadata.dpiY = y / kPngInchesPerMetre;
+    TakeResolution(x / kPngInchesPerMeter, y / kPngInchesPerMeter, picture.metadata);
   }
 }
 

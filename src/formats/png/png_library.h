@@ -6,7 +6,7 @@ namespace fotomill {
 
 // What reader and writer share of libpng.
 inline constexpr char kPngXmpKeyword[] = "XML:com.adobe.xmp";
-inline constexpr double kPngInchesPerMetre = 39.3701;  // PNG states pixels per meter
+inline constexpr double kPngInchesPerMeter = 39.3701;  // PNG states pixels per meter
 
 // The library's errors end here: they are told by the status, never printed.
 [[noreturn]] inline void OnPngError(png_structp png, png_const_charp) { png_longjmp(png, 1); }

@@ -56,8 +56,8 @@ void SetMetadata(const PngWriter& writer, const PictureRecord& picture, bool kee
   const PictureMetadata& metadata = picture.metadata;
   if (metadata.dpiX > 0 && metadata.dpiY > 0) {
     png_set_pHYs(writer.png, writer.info,
-                 static_cast<png_uint_32>(std::lround(metadata.dpiX * kPngInchesPerMetre)),
-                 static_cast<png_uint_32>(std::lround(metadata.dpiY * kPngInchesPerMetre)),
+                 static_cast<png_uint_32>(std::lround(metadata.dpiX * kPngInchesPerMeter)),
+                 static_cast<png_uint_32>(std::lround(metadata.dpiY * kPngInchesPerMeter)),
                  PNG_RESOLUTION_METER);
   }
   if (!metadata.icc.empty()) {

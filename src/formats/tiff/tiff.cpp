@@ -20,146 +20,28 @@
 #include "formats/tiff/tiff.h"
 
 #include <algorithm>
-#include <bit>
-#include <cmath>
 #include <cstring>
-#include <optional>
 #include <string>
-#include <unordered_set>
 #include <vector>
 
 #include "containers/exif_directories.h"
-#include "core/byte_reader.h"
 #include "core/limits.h"
+#include "formats/metadata_blocks.h"
 #include "formats/png/png_filter.h"
 #include "formats/tiff/tiff_file.h"
-#include "formats/tiff/tiff_lab.h"
+#include "formats/tiff/tiff_layout.h"
 #include "formats/tiff/tiff_lzw.h"
-#include "formats/tiff/tiff_samples.h"
+#include "formats/tiff/tiff_rows.h"
 #include "picture/gray_palette.h"
 #include "picture/partial.h"
 #include "platform/file_view.h"
-#include "processing/pixel_rows.h"
 
 namespace fotomill {
 
 namespace {
 
-constexpr double kCentimetresPerInch = 2.54;
+constexpr double kCentimetersPerInch = 2.54;
 constexpr uint32_t kMostRowSamples = 1 << 25;  // a row is held as a whole
-
-// How the rows of a page become the picture's.
-enum class TiffRows {
-  Direct,   // as the picture stores them
-  Nibbles,  // 2-bit values, to become 4-bit ones
-  Gray,     // through bytes, one of them a pixel
-  Color,    // through bytes, to blue, green, red and alpha
-  Library   // the library's own conversion
-};
-
-struct TiffLayout {
-  uint32_t width = 0, height = 0;
-  TiffSampleForm form;
-  uint16_t samples = 1, colors = 1;  // of a pixel, and how many of them are colors
-  uint16_t photometric = 0, compression = 0;
-  bool separate = false;  // each sample has strips or tiles of its own
-  bool tiled = false;
-  uint32_t bandHeight = 0;  // rows of a strip or tile
-  uint32_t tileWidth = 0;
-  int alpha = -1;           // the sample that is alpha
-  bool multiplied = false;  // colors were multiplied by alpha
-  TiffRows rows = TiffRows::Library;
-  int32_t bitsPerPixel = 24;
-};
-
-template <typename T>
-T Field(TIFF* tiff, uint32_t tag) {
-  T value = 0;
-  TIFFGetFieldDefaulted(tiff, tag, &value);
-  return value;
-}
-
-void FindAlpha(TIFF* tiff, TiffLayout& layout) {
-  uint16_t count = 0, *kinds = nullptr;
-  const bool told = TIFFGetField(tiff, TIFFTAG_EXTRASAMPLES, &count, &kinds) != 0 && count > 0;
-  // old files do not say
-  if (!told && layout.photometric == PHOTOMETRIC_RGB && layout.samples == 4) layout.alpha = 3;
-  if (!told) return;
-  for (uint16_t i = 0; i < count && layout.alpha < 0; ++i) {
-    if (kinds[i] != EXTRASAMPLE_ASSOCALPHA && kinds[i] != EXTRASAMPLE_UNASSALPHA) continue;
-    layout.alpha = layout.colors + i;
-    layout.multiplied = kinds[i] == EXTRASAMPLE_ASSOCALPHA;
-  }
-  if (layout.alpha >= layout.samples) layout.alpha = -1;
-}
-
-uint16_t ColorsOf(TIFF* tiff, const TiffLayout& layout) {
-  switch (layout.photometric) {
-    case PHOTOMETRIC_RGB: return 3;
-    case PHOTOMETRIC_YCBCR: return layout.compression == COMPRESSION_JPEG ? 3 : 0;
-    case PHOTOMETRIC_SEPARATED: return Field<uint16_t>(tiff, TIFFTAG_INKSET) == INKSET_CMYK ? 4 : 0;
-    case PHOTOMETRIC_CIELAB:
-    case PHOTOMETRIC_ICCLAB:
-      return layout.samples >= 3 && (layout.form.bits == 8 || layout.form.bits == 16) ? 3 : 0;
-    case PHOTOMETRIC_MINISBLACK:
-    case PHOTOMETRIC_MINISWHITE:
-    case PHOTOMETRIC_PALETTE: return 1;
-    default: return 0;  // left to the library
-  }
-}
-
-void ChooseRows(TiffLayout& layout) {
-  const bool indexed = layout.photometric == PHOTOMETRIC_PALETTE;
-  const uint32_t bits = layout.form.bits;
-  const bool small = bits <= 8 && layout.form.kind == TiffSampleForm::Unsigned;
-  if (layout.colors == 0 || layout.colors > layout.samples || !CanConvert(layout.form) ||
-      (indexed && !small))
-    return;
-  if (layout.colors == 1 && layout.alpha < 0 && layout.samples == 1 && small &&
-      std::has_single_bit(bits)) {
-    layout.rows = bits == 2 ? TiffRows::Nibbles : TiffRows::Direct;
-    layout.bitsPerPixel = static_cast<int32_t>(bits);
-  } else if (layout.colors == 1 && layout.alpha < 0) {
-    layout.rows = TiffRows::Gray;
-    layout.bitsPerPixel = 8;
-  } else {
-    layout.rows = TiffRows::Color;
-  }
-}
-
-Status ReadLayout(TIFF* tiff, TiffLayout& layout) {
-  layout.width = Field<uint32_t>(tiff, TIFFTAG_IMAGEWIDTH);
-  layout.height = Field<uint32_t>(tiff, TIFFTAG_IMAGELENGTH);
-  if (layout.width < 1 || layout.height < 1 || layout.width > INT32_MAX ||
-      layout.height > INT32_MAX)
-    return Status::DamagedFile;
-  layout.form.bits = Field<uint16_t>(tiff, TIFFTAG_BITSPERSAMPLE);
-  layout.samples = Field<uint16_t>(tiff, TIFFTAG_SAMPLESPERPIXEL);
-  layout.compression = Field<uint16_t>(tiff, TIFFTAG_COMPRESSION);
-  const uint16_t format = Field<uint16_t>(tiff, TIFFTAG_SAMPLEFORMAT);
-  layout.form.kind = format == SAMPLEFORMAT_IEEEFP ? TiffSampleForm::Float
-                     : format == SAMPLEFORMAT_INT  ? TiffSampleForm::Signed
-                                                   : TiffSampleForm::Unsigned;
-  // old fax files leave it out
-  if (TIFFGetField(tiff, TIFFTAG_PHOTOMETRIC, &layout.photometric) == 0) {
-    layout.photometric = layout.samples >= 3 ? PHOTOMETRIC_RGB : PHOTOMETRIC_MINISWHITE;
-  }
-  if (layout.samples < 1 || layout.form.bits < 1) return Status::DamagedFile;
-  layout.separate =
-      layout.samples > 1 && Field<uint16_t>(tiff, TIFFTAG_PLANARCONFIG) == PLANARCONFIG_SEPARATE;
-  layout.tiled = TIFFIsTiled(tiff) != 0;
-  layout.tileWidth = layout.tiled ? Field<uint32_t>(tiff, TIFFTAG_TILEWIDTH) : layout.width;
-  layout.bandHeight =
-      Field<uint32_t>(tiff, layout.tiled ? TIFFTAG_TILELENGTH : TIFFTAG_ROWSPERSTRIP);
-  if (layout.bandHeight < 1 || layout.tileWidth < 1) return Status::DamagedFile;
-  if (!layout.tiled) layout.bandHeight = std::min(layout.bandHeight, layout.height);
-  layout.colors = ColorsOf(tiff, layout);
-  if (layout.colors > 0) FindAlpha(tiff, layout);
-  ChooseRows(layout);
-  if (layout.compression == COMPRESSION_JPEG)
-    TIFFSetField(tiff, TIFFTAG_JPEGCOLORMODE, JPEGCOLORMODE_RGB);
-  return Status::Ok;
-}
 
 // Uncompressed pixels must be in the file before memory is taken for them.
 bool FileHoldsPixels(const TiffInput& input, const TiffLayout& layout) {
@@ -197,13 +79,11 @@ void TakePalette(TIFF* tiff, const TiffLayout& layout, Palette& palette) {
   }
 }
 
-void TakeBlock(TIFF* tiff, uint32_t tag, std::vector<uint8_t>& block) {
+void TakeTag(TIFF* tiff, uint32_t tag, std::vector<uint8_t>& block) {
   uint32_t size = 0;
   void* data = nullptr;
-  block.clear();
-  if (TIFFGetField(tiff, tag, &size, &data) == 0 || data == nullptr || size > limits.metadataBytes)
-    return;
-  block.assign(static_cast<const uint8_t*>(data), static_cast<const uint8_t*>(data) + size);
+  const bool found = TIFFGetField(tiff, tag, &size, &data) != 0 && data != nullptr;
+  TakeBlock({static_cast<const uint8_t*>(data), found ? size : 0}, block);
 }
 
 void TakeMetadata(const TiffInput& input, PictureRecord& picture) {
@@ -212,8 +92,8 @@ void TakeMetadata(const TiffInput& input, PictureRecord& picture) {
   metadata = {};
   const DirectoryForm form = {TIFFIsBigEndian(tiff) != 0, TIFFIsBigTIFF(tiff) != 0};
   metadata.exif = MakePictureBlock(GatherExif(input.Bytes(), form, TIFFCurrentDirOffset(tiff)));
-  TakeBlock(tiff, TIFFTAG_XMLPACKET, metadata.xmp);
-  TakeBlock(tiff, TIFFTAG_ICCPROFILE, metadata.icc);
+  TakeTag(tiff, TIFFTAG_XMLPACKET, metadata.xmp);
+  TakeTag(tiff, TIFFTAG_ICCPROFILE, metadata.icc);
   picture.comment.clear();
   const char* text = nullptr;
   if (TIFFGetField(tiff, TIFFTAG_IMAGEDESCRIPTION, &text) != 0 && text != nullptr) {
@@ -221,14 +101,11 @@ void TakeMetadata(const TiffInput& input, PictureRecord& picture) {
                            text + std::min<uint64_t>(std::strlen(text), limits.metadataBytes));
   }
   float x = 0, y = 0;
-  const uint16_t unit = Field<uint16_t>(tiff, TIFFTAG_RESOLUTIONUNIT);
+  const uint16_t unit = TiffField<uint16_t>(tiff, TIFFTAG_RESOLUTIONUNIT);
   TIFFGetField(tiff, TIFFTAG_XRESOLUTION, &x);
   TIFFGetField(tiff, TIFFTAG_YRESOLUTION, &y);
-  if (unit == RESUNIT_NONE || !(x > 0) || !(y > 0) || !std::isfinite(x) || !std::isfinite(y))
-    return;
-  const double perInch = unit == RESUNIT_CENTIMETER ? kCentimetresPerInch : 1;
-  metadata.dpiX = x * perInch;
-  metadata.dpiY = y * perInch;
+  const double perInch = unit == RESUNIT_CENTIMETER ? kCentimetersPerInch : 1;
+  if (unit != RESUNIT_NONE) TakeResolution(x * perInch, y * perInch, metadata);
 }
 
 bool HoldsIptc(TIFF* tiff) {
@@ -256,47 +133,15 @@ bool HoldsFurtherTags(TIFF* tiff) {
   return false;
 }
 
-// Offsets of the page directories within the file, up to the limit. A second
-// visit ends the chain; a look at those visited is only needed where it goes back.
-std::vector<uint64_t> PageOffsets(const TiffInput& input) {
-  const bool big = TIFFIsBigTIFF(input.Handle()) != 0;
-  const bool bigEndian = TIFFIsBigEndian(input.Handle()) != 0;
-  ByteReader bytes(input.Bytes());
-  const auto number = [&](int size) -> uint64_t {
-    if (size == 2) return bigEndian ? bytes.Be16() : bytes.Le16();
-    const uint64_t first = bigEndian ? bytes.Be32() : bytes.Le32();
-    if (size == 4) return first;
-    return bigEndian ? first << 32 | bytes.Be32() : first | uint64_t{bytes.Le32()} << 32;
-  };
-  std::vector<uint64_t> offsets;
-  std::unordered_set<uint64_t> visited;
-  uint64_t furthest = 0;
-  bytes.Seek(big ? 8 : 4);
-  for (uint64_t next = number(big ? 8 : 4); next != 0 && offsets.size() < limits.filePages;) {
-    bytes.Seek(next);
-    const uint64_t entries = number(big ? 8 : 2);
-    const uint64_t entrySize = big ? 20 : 12;
-    if (!bytes.Ok() || entries == 0 || entries > bytes.Left() / entrySize) break;
-    if (next <= furthest && visited.empty()) visited.insert(offsets.begin(), offsets.end());
-    if ((next <= furthest || !visited.empty()) && !visited.insert(next).second) break;
-    furthest = std::max(furthest, next);
-    offsets.push_back(next);
-    bytes.Skip(entries * entrySize);
-    next = number(big ? 8 : 4);
-    if (!bytes.Ok()) break;
-  }
-  return offsets;
-}
-
 // Opens a page and fills the facts.
 Status Describe(TiffInput& input, int32_t page, TiffLayout& layout, PictureRecord& picture) {
   RETURN_IF_BAD(input.Open());
-  const std::vector<uint64_t> offsets = PageOffsets(input);
+  const std::vector<uint64_t> offsets = input.PageOffsets();
   const size_t pages = std::max<size_t>(offsets.size(), 1);
   if (page < 0 || static_cast<size_t>(page) >= pages) return Status::NoImages;
   if (page > 0) RETURN_IF_BAD(input.OpenAt(offsets[static_cast<size_t>(page)]));
   TIFF* tiff = input.Handle();
-  RETURN_IF_BAD(ReadLayout(tiff, layout));
+  RETURN_IF_BAD(ReadTiffLayout(tiff, layout));
   picture.pageCount = static_cast<int32_t>(pages);
   picture.typeName.AssignCut(TIFFIsBigTIFF(tiff) != 0 ? "BigTIFF" : "TIFF");
   picture.width = static_cast<int32_t>(layout.width);
@@ -316,121 +161,11 @@ Status Describe(TiffInput& input, int32_t page, TiffLayout& layout, PictureRecor
   return Status::Ok;
 }
 
-struct TiffTarget {
-  PackedImage image, alpha;
-};
-
-uint8_t Divided(uint32_t value, uint32_t alpha) {
-  return alpha == 0 ? 0 : static_cast<uint8_t>(std::min(255u, (value * 255 + alpha / 2) / alpha));
-}
-
-bool IsLab(const TiffLayout& layout) {
-  return layout.photometric == PHOTOMETRIC_CIELAB || layout.photometric == PHOTOMETRIC_ICCLAB;
-}
-
-// Turns decoded rows into the picture's.
-class TiffConverter {
- public:
-  TiffConverter(const TiffLayout& layout, const Palette& palette, TiffTarget& target)
-      : layout_(layout),
-        palette_(palette),
-        target_(target),
-        bytes_(size_t{layout.samples} * layout.width) {
-    if (IsLab(layout)) lab_.emplace(layout.photometric == PHOTOMETRIC_CIELAB);
-  }
-
-  // `row` holds all samples, or the first one's row with those of the others `planeStride` bytes
-  // apart.
-  void Store(int32_t y, const uint8_t* row, size_t planeStride) {
-    uint8_t* image = target_.image.Row(y).data();
-    const size_t width = layout_.width;
-    if (layout_.rows == TiffRows::Direct) {
-      std::memcpy(image, row, (width * layout_.form.bits + 7) / 8);
-    } else if (layout_.rows == TiffRows::Nibbles) {
-      for (size_t x = 0; x < width; ++x) {
-        const int value = row[x / 4] >> (6 - x % 4 * 2) & 3;
-        image[x / 2] = static_cast<uint8_t>(x % 2 == 0 ? value << 4 : image[x / 2] | value);
-      }
-    } else {
-      const uint8_t* samples = AsBytes(row, planeStride);
-      if (layout_.rows == TiffRows::Gray) {
-        for (size_t x = 0; x < width; ++x) image[x] = samples[x * layout_.samples];
-      } else {
-        StoreColors(samples, image);
-        if (layout_.alpha >= 0) StoreAlpha(samples, image, target_.alpha.Row(y).data());
-      }
-    }
-  }
-
- private:
-  const uint8_t* AsBytes(const uint8_t* row, size_t planeStride) {
-    const bool scaled = layout_.photometric != PHOTOMETRIC_PALETTE;
-    const TiffSampleForm& form = layout_.form;
-    if (planeStride == 0) {
-      if (form.bits == 8 && form.kind == TiffSampleForm::Unsigned) return row;
-      ConvertSamples(row, form, scaled, bytes_.size(), bytes_.data(), 1);
-      return bytes_.data();
-    }
-    for (size_t s = 0; s < layout_.samples; ++s) {
-      ConvertSamples(row + s * planeStride, form, scaled, layout_.width, bytes_.data() + s,
-                     layout_.samples);
-    }
-    return bytes_.data();
-  }
-
-  void StoreColors(const uint8_t* samples, uint8_t* image) {
-    const size_t width = layout_.width, step = layout_.samples;
-    if (lab_) {
-      lab_->StoreRow(samples, step, width, image);
-    } else if (layout_.colors == 3 && step == 3) {
-      SwapColors(samples, width, image);
-    } else if (layout_.colors == 3) {
-      for (size_t x = 0; x < width; ++x, samples += step, image += 3) {
-        image[0] = samples[2];
-        image[1] = samples[1];
-        image[2] = samples[0];
-      }
-    } else if (layout_.colors == 4) {
-      for (size_t x = 0; x < width; ++x, samples += step, image += 3) {
-        for (size_t i = 0; i < 3; ++i)
-          image[i] =
-              static_cast<uint8_t>(((255u - samples[2 - i]) * (255u - samples[3]) + 127) / 255);
-      }
-    } else {
-      const bool indexed = layout_.photometric == PHOTOMETRIC_PALETTE;
-      const uint8_t flip = layout_.photometric == PHOTOMETRIC_MINISWHITE ? 255 : 0;
-      for (size_t x = 0; x < width; ++x, samples += step, image += 3) {
-        for (size_t i = 0; i < 3; ++i) {
-          image[i] = indexed ? palette_[3 * size_t{samples[0]} + 2 - i]
-                             : static_cast<uint8_t>(samples[0] ^ flip);
-        }
-      }
-    }
-  }
-
-  void StoreAlpha(const uint8_t* samples, uint8_t* image, uint8_t* alpha) const {
-    const bool unscaled = layout_.photometric == PHOTOMETRIC_PALETTE;
-    const uint32_t most = unscaled ? (1u << layout_.form.bits) - 1 : 255;
-    samples += layout_.alpha;
-    for (size_t x = 0; x < layout_.width; ++x, samples += layout_.samples, image += 3) {
-      alpha[x] = static_cast<uint8_t>(*samples * 255u / most);
-      if (!layout_.multiplied) continue;
-      for (size_t i = 0; i < 3; ++i) image[i] = Divided(image[i], alpha[x]);
-    }
-  }
-
-  const TiffLayout& layout_;
-  const Palette& palette_;
-  TiffTarget& target_;
-  std::vector<uint8_t> bytes_;  // one row's samples
-  std::optional<TiffLab> lab_;
-};
-
 // Whether rows can be taken from the strips without the library: whole bytes or less a sample, in
 // the usual bit order.
 bool HasPlainStrips(TIFF* tiff, const TiffLayout& layout) {
   return !layout.tiled && !layout.separate && layout.form.bits <= 8 &&
-         Field<uint16_t>(tiff, TIFFTAG_FILLORDER) == FILLORDER_MSB2LSB &&
+         TiffField<uint16_t>(tiff, TIFFTAG_FILLORDER) == FILLORDER_MSB2LSB &&
          (layout.photometric != PHOTOMETRIC_YCBCR);
 }
 
@@ -444,7 +179,7 @@ bool ReadPlainStrips(TiffInput& input, const TiffLayout& layout, const PictureRe
   if (!HasPlainStrips(tiff, layout) || (!packed && layout.compression != COMPRESSION_NONE))
     return false;
   const uint16_t predictor =
-      packed ? Field<uint16_t>(tiff, TIFFTAG_PREDICTOR) : uint16_t{PREDICTOR_NONE};
+      packed ? TiffField<uint16_t>(tiff, TIFFTAG_PREDICTOR) : uint16_t{PREDICTOR_NONE};
   const bool differences = predictor == PREDICTOR_HORIZONTAL;
   if (predictor != PREDICTOR_NONE && (!differences || layout.form.bits != 8)) return false;
   const uint64_t rowBytes = (uint64_t{layout.width} * layout.form.bits * layout.samples + 7) / 8;
@@ -464,7 +199,7 @@ bool ReadPlainStrips(TiffInput& input, const TiffLayout& layout, const PictureRe
     if (packed && decoded == nullptr) return false;
     for (uint32_t r = 0; r < rows; ++r) {
       const uint64_t place = r * rowBytes;
-      // Differences between neighbours are what the format's namesake in PNG has too.
+      // Differences between neighbors are what the format's namesake in PNG has too.
       if (differences && !UndoPngFilter(static_cast<uint8_t>(PngFilter::Sub), decoded + place,
                                         none.data(), rowBytes, layout.samples)) {
         return false;
@@ -666,7 +401,7 @@ void AddDetails(TIFF* tiff, const TiffLayout& layout, const PictureRecord& pictu
     lines.AddFormat("   Resolution: %.0f x %.0f dpi", metadata.dpiX, metadata.dpiY);
   if (layout.alpha >= 0)
     lines.AddFormat("        Alpha: %s", layout.multiplied ? "multiplied in" : "separate");
-  const uint16_t orientation = Field<uint16_t>(tiff, TIFFTAG_ORIENTATION);
+  const uint16_t orientation = TiffField<uint16_t>(tiff, TIFFTAG_ORIENTATION);
   if (orientation > 1) lines.AddFormat("  Orientation: %u", unsigned{orientation});
   if (!metadata.icc.empty()) lines.AddFormat("  ICC profile: %zu bytes", metadata.icc.size());
   if (!metadata.xmp.empty()) lines.AddFormat("          XMP: %zu bytes", metadata.xmp.size());

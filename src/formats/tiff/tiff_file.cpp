@@ -5,6 +5,7 @@
 #include <cstring>
 #include <memory>
 #include <string_view>
+#include <unordered_set>
 
 #include "core/byte_reader.h"
 #include "core/limits.h"
@@ -120,6 +121,37 @@ void TiffInput::NameDirectory(uint64_t offset, std::span<uint8_t> bytes) const {
     if (place < offset || place - offset >= bytes.size()) continue;
     bytes[place - offset] = static_cast<uint8_t>(directory_ >> 8 * (bigEndian ? size - 1 - i : i));
   }
+}
+
+// A look at the directories visited is only needed where the chain goes back.
+std::vector<uint64_t> TiffInput::PageOffsets() const {
+  const bool big = TIFFIsBigTIFF(tiff_) != 0;
+  const bool bigEndian = TIFFIsBigEndian(tiff_) != 0;
+  ByteReader bytes(bytes_);
+  const auto number = [&](int size) -> uint64_t {
+    if (size == 2) return bigEndian ? bytes.Be16() : bytes.Le16();
+    const uint64_t first = bigEndian ? bytes.Be32() : bytes.Le32();
+    if (size == 4) return first;
+    return bigEndian ? first << 32 | bytes.Be32() : first | uint64_t{bytes.Le32()} << 32;
+  };
+  std::vector<uint64_t> offsets;
+  std::unordered_set<uint64_t> visited;
+  uint64_t furthest = 0;
+  bytes.Seek(big ? 8 : 4);
+  for (uint64_t next = number(big ? 8 : 4); next != 0 && offsets.size() < limits.filePages;) {
+    bytes.Seek(next);
+    const uint64_t entries = number(big ? 8 : 2);
+    const uint64_t entrySize = big ? 20 : 12;
+    if (!bytes.Ok() || entries == 0 || entries > bytes.Left() / entrySize) break;
+    if (next <= furthest && visited.empty()) visited.insert(offsets.begin(), offsets.end());
+    if ((next <= furthest || !visited.empty()) && !visited.insert(next).second) break;
+    furthest = std::max(furthest, next);
+    offsets.push_back(next);
+    bytes.Skip(entries * entrySize);
+    next = number(big ? 8 : 4);
+    if (!bytes.Ok()) break;
+  }
+  return offsets;
 }
 
 Status TiffInput::Failure() const {

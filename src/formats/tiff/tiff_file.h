@@ -4,6 +4,7 @@
 
 #include <cstdint>
 #include <span>
+#include <vector>
 
 #include "core/byte_writer.h"
 #include "core/status.h"
@@ -31,6 +32,9 @@ class TiffInput {
   // Opens the file again at another directory, as if its header named that one: the library would
   // otherwise follow the whole chain for each page. Statuses of Open.
   Status OpenAt(uint64_t directory);
+  // Offsets of the page directories within the file, up to the limit; a second visit ends the
+  // chain. Of a file that is open.
+  std::vector<uint64_t> PageOffsets() const;
   // What a failed call of the library means, by its message.
   Status Failure() const;
   TIFF* Handle() const { return tiff_; }  // of the library; null until Open

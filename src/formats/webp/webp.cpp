@@ -29,6 +29,7 @@
 #include "core/byte_reader.h"
 #include "core/byte_writer.h"
 #include "core/limits.h"
+#include "formats/metadata_blocks.h"
 #include "picture/partial.h"
 #include "platform/file_view.h"
 
@@ -140,11 +141,6 @@ Status ParseFile(std::span<const uint8_t> data, WebpFile& file) {
   return Status::Ok;
 }
 
-void Assign(std::vector<uint8_t>& block, std::span<const uint8_t> data) {
-  block.clear();
-  if (data.size() <= limits.metadataBytes) block.assign(data.begin(), data.end());
-}
-
 void Describe(const WebpFile& file, PictureRecord& picture) {
   picture.typeName.AssignCut(file.frames.size() > 1     ? "Animated WebP"
                              : file.format == kLossless ? "WebP, lossless"
@@ -161,9 +157,9 @@ void Describe(const WebpFile& file, PictureRecord& picture) {
   picture.metadata = {};
   // some programs put it in front, as in JPEG
   const bool headed = ByteReader(file.exif).Match(kExifHead);
-  Assign(picture.metadata.exif, headed ? file.exif.subspan(kExifHead.size()) : file.exif);
-  Assign(picture.metadata.xmp, file.xmp);
-  Assign(picture.metadata.icc, file.icc);
+  TakeBlock(headed ? file.exif.subspan(kExifHead.size()) : file.exif, picture.metadata.exif);
+  TakeBlock(file.xmp, picture.metadata.xmp);
+  TakeBlock(file.icc, picture.metadata.icc);
 }
 
 // Puts a row of a frame onto the canvas: in the place of what is there, or over it.
