@@ -11,7 +11,7 @@ namespace {
 constexpr uint8_t kApp0 = 0xE0, kApp2 = 0xE2, kApp14 = 0xEE, kApp15 = 0xEF, kComment = 0xFE;
 constexpr uint8_t kEnd = 0xD9, kFirstRestart = 0xD0, kLastRestart = 0xD7, kPrefix = 0xFF;
 constexpr std::string_view kJfif("JFIF\0", 5), kProfile("ICC_PROFILE\0", 12), kAdobe("Adobe", 5);
-constexpr size_t kJfifSize = 14;  // without its thumbnail, whose sides are the last two bytes
+constexpr size_t kJfifSize = 14;  // without a thumbnail, whose size is in the last two bytes
 
 void Append(std::vector<uint8_t>& bytes, std::span<const uint8_t> more) {
   bytes.insert(bytes.end(), more.begin(), more.end());
@@ -21,7 +21,7 @@ bool IsApplication(uint8_t marker) {
   return (marker >= kApp0 && marker <= kApp15) || marker == kComment;
 }
 
-// The segment that says how samples become colors; without its thumbnail.
+// The JFIF segment, which implies the color space; without its thumbnail.
 void AppendJfif(std::span<const uint8_t> data, std::vector<uint8_t>& bare) {
   Append(bare, std::initializer_list<uint8_t>{kPrefix, kApp0, 0, kJfifSize + 2});
   Append(bare, data.first(kJfifSize - 2));
@@ -38,8 +38,7 @@ void AppendSegment(const JpegSegment& segment, std::vector<uint8_t>& bare) {
   if (belongs && !jfif) Append(bare, segment.whole);
 }
 
-// Copies from the first scan up to the end of the picture. Between its scans are tables, and
-// comments that nothing keeps out.
+// Copies from the first scan to the end of the picture, without the comments between scans.
 Status AppendScans(std::span<const uint8_t> file, size_t scan, std::vector<uint8_t>& bare) {
   size_t copied = scan, at = scan;
   while (true) {

@@ -8,7 +8,7 @@ namespace fotomill {
 
 namespace {
 
-// Chunks that decide how the picture looks, how large it is, or that hold it.
+// Chunks with the pixels, or that affect the picture's appearance or size.
 constexpr std::string_view kPicture[] = {
     "IHDR", "PLTE", "IDAT", "IEND", "tRNS", "cHRM", "gAMA", "iCCP", "sBIT", "sRGB", "cICP", "mDCv",
     "mDCV", "cLLi", "cLLI", "bKGD", "hIST", "pHYs", "sPLT", "oFFs", "acTL", "fcTL", "fdAT"};

@@ -1,5 +1,5 @@
-// A TIFF file names everything by its place in the file, so nothing is moved: a directory keeps its
-// place with fewer entries, and what no entry leads to any more becomes zero.
+// TIFF files refer to everything by offset, so nothing is moved: directories are shortened in
+// place, and whatever is no longer referenced is zeroed.
 // Source: Adobe, "TIFF Revision 6.0" (1992); the libtiff project, "The BigTIFF Design".
 #include <algorithm>
 #include <unordered_set>
@@ -12,9 +12,9 @@ namespace fotomill {
 
 namespace {
 
-// Tags that decide how a picture looks, how large it is, or that hold it: those of TIFF 6.0 but for
-// texts and dates, those of fax, tiles and JPEG, the color profile, and those that compressions of
-// later days need.
+// Tags that contain the picture or affect its appearance or size: those of TIFF 6.0
+// except texts and dates, those for fax, tiles and JPEG, the color profile, and those of
+// later compression schemes.
 struct TagRange {
   uint32_t first, last;
 };
@@ -26,12 +26,12 @@ constexpr TagRange kPicture[] = {
 };
 constexpr uint32_t kStripOffsets = 273, kStripSizes = 279, kTileOffsets = 324, kTileSizes = 325;
 constexpr uint32_t kSubDirectories = 330, kJpegOffset = 513, kJpegSize = 514;
-// pointers to the tables of the first JPEG form: quantization, and two of Huffman codes
+// offsets of the tables of old-style JPEG: quantization, and two kinds of Huffman tables
 constexpr uint32_t kFirstJpegTables = 519, kLastJpegTables = 521;
 constexpr uint64_t kMostJpegTable = 16 + 256;
 constexpr uint32_t kExif = 34665, kGps = 34853, kInteroperability = 40965;
 constexpr uint8_t kTypeBytes[] = {0, 1, 1, 2, 4, 8, 1, 1, 2, 4, 8, 4, 8, 4, 0, 0, 8, 8, 8};
-constexpr int32_t kDeepest = 4;            // directories within directories
+constexpr int32_t kDeepest = 4;            // nesting depth of directories
 constexpr uint64_t kMostPieces = 1 << 23;  // strips and tiles of all pages
 
 bool BelongsToPicture(uint32_t tag) {
@@ -39,7 +39,7 @@ bool BelongsToPicture(uint32_t tag) {
       kPicture, [tag](const TagRange& range) { return tag >= range.first && tag <= range.last; });
 }
 
-// Bytes of the file, from `first` up to `end`.
+// Bytes of the file, from `first` to before `end`.
 struct Range {
   uint64_t first, end;
 };
@@ -48,8 +48,8 @@ struct Entry {
   uint32_t tag = 0, type = 0;
   uint64_t count = 0;
   uint64_t start = 0;            // of the entry itself
-  uint64_t value = 0, size = 0;  // where its values are
-  bool outside = false;          // of the entry
+  uint64_t value = 0, size = 0;  // offset and size of its values
+  bool outside = false;          // outside the entry
 };
 
 class BareTiff {
@@ -79,7 +79,7 @@ class BareTiff {
   bool Holds(uint64_t at, uint64_t size) const {
     return at <= file_.size() && size <= file_.size() - at;
   }
-  // A number of the file; 0 where it does not hold it.
+  // An integer at an offset; 0 beyond the end of the file.
   uint64_t Number(uint64_t at, uint64_t size) const {
     uint64_t number = 0;
     if (!Holds(at, size)) return 0;
@@ -90,7 +90,7 @@ class BareTiff {
   void Keep(uint64_t at, uint64_t size) { kept_.push_back({at, at + size}); }
   void Drop(uint64_t at, uint64_t size) { dropped_.push_back({at, at + size}); }
 
-  // The directories from `at` on, each leading to the next.
+  // Processes the chain of directories starting at `at`.
   Status TakeChain(uint64_t at, int32_t depth) {
     while (at != 0) {
       if (!visited_.insert(at).second || visited_.size() > limits.filePages)
@@ -101,7 +101,7 @@ class BareTiff {
     return Status::Ok;
   }
 
-  // Reads the entries of a directory; `next_` is behind them.
+  // Reads the entries of a directory; `next_` is the offset after them.
   Status ReadEntries(uint64_t at, std::vector<Entry>& entries) {
     const uint64_t count = Number(at, CountBytes());
     if (!Holds(at, CountBytes())) return Status::FileReadError;
@@ -130,7 +130,7 @@ class BareTiff {
     RETURN_IF_BAD(ReadEntries(at, entries));
     if (!Holds(next_, Word())) return Status::FileReadError;
     const uint64_t end = next_, following = Number(next_, Word());
-    uint64_t target = at + CountBytes();  // of the next entry that stays
+    uint64_t target = at + CountBytes();  // where the next kept entry goes
     for (const Entry& entry : entries) {
       if (!BelongsToPicture(entry.tag)) {
         DropEntry(entry, 0);
@@ -157,7 +157,7 @@ class BareTiff {
       bare_[at + (bigEndian_ ? size - 1 - i : i)] = static_cast<uint8_t>(number >> 8 * i);
   }
 
-  // Its values, and those of the directory that it leads to.
+  // Drops an entry with its values and the directory it points to.
   void DropEntry(const Entry& entry, int32_t depth) {
     if (entry.outside && Holds(entry.value, entry.size)) Drop(entry.value, entry.size);
     const bool pointer = entry.tag == kExif || entry.tag == kGps || entry.tag == kInteroperability;
@@ -175,8 +175,8 @@ class BareTiff {
     return each > 8 ? 0 : Number(entry.value + i * each, each);
   }
 
-  // The pieces of the picture. Those beyond the file are no matter of ours. UnsupportedFormat when
-  // there are absurdly many.
+  // Marks the strips and tiles as used. Those beyond the end of the file are ignored.
+  // UnsupportedFormat if their number is absurd.
   Status KeepData(const std::vector<Entry>& entries) {
     const auto find = [&](uint32_t tag) {
       const auto found = std::ranges::find(entries, tag, &Entry::tag);
@@ -190,7 +190,7 @@ class BareTiff {
       if (pieces_ > kMostPieces) return Status::UnsupportedFormat;
       for (uint64_t i = 0; i < offsets->count; ++i) {
         const uint64_t at = NumberOf(*offsets, i);
-        // without a size: up to the end
+        // without a size: to the end of the file
         const bool sized = sizes != nullptr && i < sizes->count;
         const uint64_t size = sized ? NumberOf(*sizes, i) : file_.size();
         if (at < file_.size()) Keep(at, std::min(size, file_.size() - at));
@@ -216,7 +216,7 @@ class BareTiff {
     return Status::Ok;
   }
 
-  // In order, without overlaps.
+  // Sorts and merges overlapping ranges.
   static void Merge(std::vector<Range>& ranges) {
     std::ranges::sort(ranges, {}, &Range::first);
     size_t last = 0;
@@ -230,11 +230,11 @@ class BareTiff {
     if (!ranges.empty()) ranges.resize(last + 1);
   }
 
-  // Puts zeros where something was dropped and nothing is kept, and cuts off the end.
+  // Zeroes what was dropped and is not used elsewhere, and truncates the file.
   void Erase() {
     Merge(kept_);
     Merge(dropped_);
-    auto next = kept_.begin();  // the first one that ends behind the place in work
+    auto next = kept_.begin();  // the first kept range that ends after the current offset
     for (const Range& range : dropped_) {
       for (uint64_t at = range.first; at < range.end;) {
         while (next != kept_.end() && next->end <= at) ++next;
@@ -249,9 +249,9 @@ class BareTiff {
   const std::span<const uint8_t> file_;
   std::vector<uint8_t>& bare_;
   bool bigEndian_ = false, wide_ = false;
-  uint64_t next_ = 0;    // behind the entries of the directory read last
+  uint64_t next_ = 0;    // offset after the entries of the last directory
   uint64_t read_ = 0;    // entries so far
-  uint64_t pieces_ = 0;  // of pixels
+  uint64_t pieces_ = 0;  // strips and tiles so far
   std::unordered_set<uint64_t> visited_;
   std::vector<Range> kept_, dropped_;
 };

@@ -1,5 +1,6 @@
-// WebP chunks: "VP8X" flags (1 byte) and sizes of a file with more than one chunk, "ICCP" the
-// profile, "ANIM" and "ANMF" frames, "ALPH", "VP8 " and "VP8L" pixels; "EXIF" and "XMP ".
+// WebP chunks: "VP8X" with flags (1 byte) and canvas size, in files with more than one chunk,
+// "ICCP" the profile, "ANIM" and "ANMF" frames, "ALPH", "VP8 " and "VP8L" pixels; "EXIF" and "XMP
+// ".
 // Source: RFC 9649, section 2.7.
 #include <algorithm>
 #include <string_view>
@@ -27,7 +28,7 @@ Status MakeBareWebp(std::span<const uint8_t> file, std::vector<uint8_t>& bare) {
     const uint64_t end = chunk.data + chunk.size;
     if (std::ranges::find(kPicture, chunk.name) == std::end(kPicture)) continue;
     ByteReader length(file.subspan(chunk.data - 4));
-    if (length.Le32() != chunk.size) return Status::FileReadError;  // the file ends within it
+    if (length.Le32() != chunk.size) return Status::FileReadError;  // the file is truncated
     const size_t place = bare.size() + 8;
     bare.insert(bare.end(), file.begin() + static_cast<ptrdiff_t>(chunk.data - 8),
                 file.begin() + static_cast<ptrdiff_t>(end));

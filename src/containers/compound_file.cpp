@@ -1,26 +1,26 @@
-// Compound files, little-endian, in sectors of 512 or 4096 bytes; sector 0 is behind the header.
+// Compound files, little-endian, in sectors of 512 or 4096 bytes; sector 0 follows the header.
 //
 //   offset size  field
 //        0    8  D0 CF 11 E0 A1 B1 1A E1
 //       28    2  byte order, FFFE
-//       30    2  a sector's size is 2 to this, 9 or 12
-//       32    2  a short sector's, 6
+//       30    2  sector size as a power of two, 9 or 12
+//       32    2  the same of short sectors, 6
 //       48    4  first sector of the directory
 //       56    4  streams below this size, 4096, are in short sectors
-//       60    4  first sector of the short sectors' table
-//       68    8  first sector that goes on with the list below, and how many there are
-//       76  436  the sectors of the table of chains
+//       60    4  first sector of the table of short sectors
+//       68    8  first sector that continues the list below, and number of such sectors
+//       76  436  the sectors of the sector table
 //
-// The table of chains has 4 bytes for each sector: the next one of the same stream, or FFFFFFFE and
-// above at its end. The directory is such a chain of entries of 128 bytes:
+// The sector table (FAT) has 4 bytes per sector: the next sector of the same stream, or FFFFFFFE and
+// above at its end. The directory is such a chain of 128-byte entries:
 //
 //        0   64  name, UTF-16
-//       64    2  its bytes, the closing zero included
-//       66    1  kind: 1 storage, 2 stream, 5 root
-//       68   12  left and right neighbor in the tree of the storage, and the first of its own
+//       64    2  its size in bytes, including the terminator
+//       66    1  type: 1 storage, 2 stream, 5 root
+//       68   12  left and right sibling in the tree of the storage, and the first child
 //      116    8  first sector, size
 //
-// The root's stream is made of the short sectors.
+// The root's stream consists of the short sectors.
 // Source: Microsoft, [MS-CFB] Compound File Binary File Format.
 #include "containers/compound_file.h"
 
@@ -32,7 +32,7 @@ namespace fotomill {
 
 namespace {
 
-constexpr uint32_t kLastSector = 0xFFFFFFFA;  // greater numbers mean something else
+constexpr uint32_t kLastSector = 0xFFFFFFFA;  // higher values are special
 constexpr uint64_t kEntryBytes = 128, kShortBytes = 64;
 constexpr size_t kListInHeader = 109;
 constexpr size_t kMostEntries = 65536;
@@ -95,7 +95,7 @@ CompoundStream CompoundFile::Chain(uint32_t first, uint64_t size) const {
     const auto bytes = Sector(sector);
     if (bytes.empty()) break;
     stream.Append(bytes.first(std::min<uint64_t>(bytes.size(), size - stream.size_)));
-    if (bytes.size() < sectorBytes_ || stream.size_ > file_.size()) break;  // more is a circle
+    if (bytes.size() < sectorBytes_ || stream.size_ > file_.size()) break;  // a cycle
   }
   return stream;
 }
@@ -197,7 +197,7 @@ int32_t CompoundFile::FindEntry(int32_t storage, Fits fits) const {
   };
   if (!valid(storage)) return kNone;
   std::vector<int32_t> open = {entries_[static_cast<size_t>(storage)].child};
-  // every entry is in one tree; more steps mean a circle
+  // every entry is in one tree; more steps mean a cycle
   for (size_t steps = 0; !open.empty() && steps <= 2 * entries_.size(); ++steps) {
     const int32_t at = open.back();
     open.pop_back();

@@ -11,20 +11,20 @@
 
 namespace fotomill {
 
-// A stream of a compound file, as views into the file; the file must stay. Short ones are copied.
+// A stream of a compound file, as views into the file; short ones are copied. The file must remain.
 class CompoundStream {
  public:
-  uint64_t Size() const { return size_; }  // bytes that are there
-  // `count` bytes from `offset` on: in the file where they lie together, else gathered in
-  // `gathered`. Empty when there are not so many.
+  uint64_t Size() const { return size_; }  // available bytes
+  // `count` bytes from `offset`: a view into the file if they are contiguous, else copied to
+  // `gathered`. Empty past the end.
   std::span<const uint8_t> Bytes(uint64_t offset, uint64_t count,
                                  std::vector<uint8_t>& gathered) const;
 
  private:
   friend class CompoundFile;
-  // Sectors that follow each other in the file.
+  // Contiguous sectors.
   struct Piece {
-    uint64_t at = 0;  // in the stream
+    uint64_t at = 0;  // offset in the stream
     std::span<const uint8_t> bytes = {};
   };
   void Append(std::span<const uint8_t> bytes);
@@ -34,19 +34,19 @@ class CompoundStream {
   uint64_t size_ = 0;
 };
 
-// A compound file: storages and streams, as folders and files in one. Names are ASCII here; other
+// A compound file: storages and streams, like folders and files. Names are reduced to ASCII; other
 // characters become '?'.
 class CompoundFile {
  public:
   static constexpr int32_t kRoot = 0, kNone = -1;
 
-  // `file` must stay. DamagedFile for what is no such file, FileReadError when it ends within what
-  // holds it together.
+  // `file` must outlive this object. DamagedFile if it is not a compound file, FileReadError if its
+  // structure is truncated.
   Status Open(std::span<const uint8_t> file);
-  // The entry of that name in a storage, or the first whose name begins so; kNone without one.
+  // The entry with that name in a storage, or the first with that prefix; kNone if not found.
   int32_t Find(int32_t storage, std::string_view name) const;
   int32_t FindBeginning(int32_t storage, std::string_view beginning) const;
-  // A stream's content; what of it is missing in the file is left out. Empty for kNone.
+  // A stream's contents; parts missing in the file are left out. Empty for kNone.
   CompoundStream Stream(int32_t entry) const;
 
  private:
@@ -69,9 +69,9 @@ class CompoundFile {
 
   std::span<const uint8_t> file_;
   uint64_t sectorBytes_ = 512;
-  std::vector<uint32_t> tableSectors_;  // where the table of chains is
+  std::vector<uint32_t> tableSectors_;  // the sectors of the sector table
   std::vector<Entry> entries_;
-  uint64_t shortLimit_ = 4096;  // smaller streams are in the short sectors
+  uint64_t shortLimit_ = 4096;  // smaller streams are in short sectors
   CompoundStream shortTable_, shortSectors_;
 };
 

@@ -14,12 +14,11 @@ constexpr uint16_t kExifPointer = 0x8769, kGpsPointer = 0x8825, kInteroperabilit
                    kOrientation = 0x0112;
 constexpr uint16_t kShort = 3, kLong = 4;
 constexpr uint16_t kMostTypes = 13;
-// that swap together
+// unit of byte swapping
 constexpr uint8_t kUnitBytes[kMostTypes + 1] = {0, 1, 1, 2, 4, 4, 1, 1, 2, 4, 4, 4, 8, 4};
 constexpr uint8_t kValueBytes[kMostTypes + 1] = {0, 1, 1, 2, 4, 8, 1, 1, 2, 4, 8, 4, 8, 4};
 
-// Tags of a first directory that tell of the picture: texts on who, when and with what;
-// orientation; ratings; titles.
+// Tags of IFD0 that describe the picture: author, date and camera; orientation; ratings; titles.
 constexpr uint16_t kDescriptive[] = {0x010D, 0x010E, 0x010F, 0x0110, kOrientation, 0x0131,
                                      0x0132, 0x013B, 0x013C, 0x4746, 0x4749,       0x8298,
                                      0x9C9B, 0x9C9C, 0x9C9D, 0x9C9E, 0x9C9F};
@@ -33,7 +32,7 @@ class DirectoryReader {
   DirectoryReader(std::span<const uint8_t> file, const DirectoryForm& form)
       : file_(file), form_(form) {}
 
-  // The entries of the directory at `offset`, and where its pointers lead.
+  // The entries of the directory at `offset`, and the offsets of its subdirectories.
   struct Result {
     ExifDirectory entries;
     uint64_t exif = 0, gps = 0, interoperability = 0;
@@ -81,7 +80,7 @@ class DirectoryReader {
   uint64_t entriesLeft_ = limits.exifEntries, bytesLeft_ = limits.metadataBytes;
 };
 
-// Writes directories behind each other, in a byte order.
+// Writes directories one after the other, in a given byte order.
 class DirectoryWriter {
  public:
   DirectoryWriter(std::vector<uint8_t>& bytes, uint32_t base, bool bigEndian, bool swapped)
@@ -91,7 +90,7 @@ class DirectoryWriter {
   void Long(uint32_t value) { Number(value, 4); }
   uint32_t Position() const { return base_ + static_cast<uint32_t>(bytes_.size()); }
 
-  // Writes a directory with its values; where it is, 0 for an empty one.
+  // Writes a directory with its values; returns its offset, 0 for an empty one.
   uint32_t Write(ExifDirectory directory) {
     if (directory.empty()) return 0;
     std::stable_sort(directory.begin(), directory.end(),
@@ -120,7 +119,7 @@ class DirectoryWriter {
     return start;
   }
 
-  // A pointer to a directory, in the byte order of the set.
+  // A pointer to a directory, in the byte order of the directories.
   ExifEntry Pointer(uint16_t tag, uint32_t offset) const {
     ExifEntry entry{tag, kLong, 1, {}};
     const bool big = bigEndian_ != swapped_;
@@ -146,7 +145,7 @@ class DirectoryWriter {
   bool bigEndian_, swapped_;
 };
 
-// EXIF, the directory that it leads to in front, and GPS.
+// The GPS and EXIF directories, preceded by the one that EXIF points to.
 void WriteSubdirectories(DirectoryWriter& writer, const ExifDirectories& directories,
                          uint32_t& exif, uint32_t& gps) {
   ExifDirectory entries = directories.exif;
@@ -188,7 +187,7 @@ ExifDirectories ParseExifBlock(std::span<const uint8_t> block) {
 
 std::vector<uint8_t> MakeExifBlock(const ExifDirectories& directories) {
   std::vector<uint8_t> subdirectories, block;
-  // The first directory is in front: its size tells where the others begin.
+  // IFD0 comes first: the other offsets depend on its size.
   ExifDirectory first = directories.first;
   const bool hasExif = !directories.exif.empty() || !directories.interoperability.empty(),
              hasGps = !directories.gps.empty();

@@ -6,63 +6,63 @@
 
 namespace fotomill {
 
-// EXIF in files that are built of TIFF's directories themselves (TIFF, BigTIFF, HD Photo): what is
-// one block elsewhere is spread there over directories among the file's own. These functions gather
-// such directories into a block, and spread a block over a file. A directory's values move as they
-// are; offsets that a maker note keeps in its own form cannot be known, so some makers' notes do
-// not survive the move.
+// EXIF in files based on TIFF directories (TIFF, BigTIFF, HD Photo): what
+// is one block in other formats is spread over directories among the
+// file's own. These functions gather such directories into a block, and
+// place a block into a file. Values are copied unchanged; private offsets
+// in maker notes are unknown, so some maker notes do not survive.
 
-// One entry: its values are behind each other, in the byte order of the set.
+// One entry, with its values in the byte order of the directories.
 struct ExifEntry {
   uint16_t tag = 0, type = 0;
   uint32_t count = 0;
   std::vector<uint8_t> value;
 };
-// In the order in which they are in the file.
+// In file order.
 using ExifDirectory = std::vector<ExifEntry>;
 
-// The directories of a camera's EXIF, in no file's form. Pointers between them are left out; they
-// are made anew.
+// The directories of EXIF, independent of a file layout. Pointers between them are omitted and
+// recreated on writing.
 struct ExifDirectories {
   bool bigEndian = false;
-  // what the first directory says of the picture, not of the file that holds it
+  // the tags of IFD0 that describe the picture, not the file
   ExifDirectory first;
   ExifDirectory exif, gps, interoperability;
-  // No directory has an entry.
+  // Whether no directory has an entry.
   bool Empty() const { return first.empty() && exif.empty() && gps.empty(); }
 };
 
-// How a file lays out its directories.
+// The layout of a file's directories.
 struct DirectoryForm {
   bool bigEndian = false;
-  bool wide = false;  // BigTIFF: counts of 8 bytes, entries of 20
+  bool wide = false;  // BigTIFF: 8-byte counts, 20-byte entries
 };
 
-// Takes the directories that the one at `offset` leads to. What is not in the file, or is beyond
-// the limits, is left out.
+// Reads the directories that the one at `offset` points to. Whatever is beyond the file or the
+// limits is left out.
 ExifDirectories GatherExif(std::span<const uint8_t> file, const DirectoryForm& form,
                            uint64_t offset);
-// The same of a block from its byte order on; empty if it is invalid.
+// As above, from a block starting at the byte order; empty if it is invalid.
 ExifDirectories ParseExifBlock(std::span<const uint8_t> block);
 
-// A block of its own, in the set's byte order.
+// An EXIF block, in the byte order of the directories.
 std::vector<uint8_t> MakeExifBlock(const ExifDirectories& directories);
-// The block of a file's directories: all of them where a camera's are among them, else the
-// orientation alone where the picture is not upright, else none.
+// The block for a file's directories: all of them if they include a camera's, else only the
+// orientation if it is not upright, else empty.
 std::vector<uint8_t> MakePictureBlock(ExifDirectories directories);
 
-// The EXIF and GPS directories for a little-endian file, in which `bytes` will be from `base` on,
-// an even place.
+// The EXIF and GPS directories for a little-endian file, where `bytes` will be at offset `base`,
+// which must be even.
 struct PlacedExif {
   std::vector<uint8_t> bytes;
-  uint32_t exifOffset = 0, gpsOffset = 0;  // in the file, 0 for none
+  uint32_t exifOffset = 0, gpsOffset = 0;  // offsets in the file, 0 if none
 };
-// Lays them out for `base`; numbers are turned into the file's byte order.
+// Lays out the directories at `base`, in the file's byte order.
 PlacedExif PlaceExif(const ExifDirectories& directories, uint32_t base);
 
-// The orientation that the first directory tells, 1 to 8; 1 when it does not.
+// The orientation in IFD0, 1 to 8; 1 if there is none.
 uint16_t OrientationOf(const ExifDirectories& directories);
-// Puts the entry into the first directory, in place of one that is there.
+// Sets the orientation in IFD0.
 void SetOrientation(ExifDirectories& directories, uint16_t orientation);
 
 }  // namespace fotomill

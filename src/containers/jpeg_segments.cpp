@@ -1,9 +1,8 @@
-// A JPEG file's segments: FF, a marker byte, a length of two bytes that counts itself, data. Any
-// number of FF may be in front of a marker; markers 01 and D0 to D8 have neither length nor data.
+// A JPEG file's segments: FF, a marker byte, a length of two bytes that includes itself, data. Any
+// number of FF may precede a marker; markers 01 and D0 to D8 have neither length nor data.
 //
-//   E0 "JFIF\0" version (2 bytes), unit, resolutions across and down (2 bytes each), width and
-//   height of a thumbnail (1 byte
-//      each), the thumbnail
+//   E0 "JFIF\0" version (2 bytes), unit, horizontal and vertical resolution (2 bytes each), width
+//      and height of a thumbnail (1 byte each), the thumbnail
 //   E0 "JFXX\0" a thumbnail in another form
 // Source: ITU-T T.81 (1992), annex B; T.871 (2011).
 #include "containers/jpeg_segments.h"
@@ -42,7 +41,7 @@ void AppendSegment(std::vector<uint8_t>& bytes, uint8_t marker, std::string_view
   Append(bytes, data);
 }
 
-// JFIF's segment for pixels that were turned.
+// The JFIF segment for rotated pixels.
 void AppendJfif(std::vector<uint8_t>& bytes, std::span<const uint8_t> data, bool swapSides) {
   std::vector<uint8_t> jfif(data.begin(), data.begin() + kJfifSize);
   if (swapSides)
@@ -52,14 +51,14 @@ void AppendJfif(std::vector<uint8_t>& bytes, std::span<const uint8_t> data, bool
   AppendSegment(bytes, kApp0, {}, jfif);
 }
 
-// Puts the segments of the new file together, in the order of the old one.
+// Assembles the segments of the new file, in the order of the old one.
 class Assembly {
  public:
   Assembly(const JpegParts& parts, std::vector<uint8_t>& made) : parts_(parts), made_(made) {}
 
   void Add(const JpegSegment& segment) {
     const bool jfif = segment.marker == kApp0 && segment.Starts(kJfifHead);
-    if (!jfif) AddNew();  // behind JFIF's own, in front of everything else
+    if (!jfif) AddNew();  // after JFIF, before everything else
     if (IsExif(segment) && !parts_.exif.empty() && !exifDone_) {
       Once(exifDone_, kExifHead, parts_.exif);
     } else if (segment.marker == kApp1 && segment.Starts(kXmpHead) && !parts_.xmp.empty() &&
@@ -72,7 +71,7 @@ class Assembly {
       Append(made_, segment.whole);
     }
   }
-  // EXIF and XMP that the old file has not.
+  // Adds EXIF and XMP that the old file does not have.
   void ExpectNone(bool exif, bool xmp) {
     exifNew_ = exif;
     xmpNew_ = xmp;
@@ -87,7 +86,7 @@ class Assembly {
   static bool IsOldThumbnail(const JpegSegment& segment) {
     return segment.marker == kApp0 && segment.Starts(kJfxxHead);
   }
-  // Further segments may hold what has no room in the first; they stay.
+  // Later segments, which may hold what does not fit into the first, are kept.
   void Once(bool& done, std::string_view heading, std::span<const uint8_t> data) {
     if (!done) AppendSegment(made_, kApp1, heading, data);
     done = true;
@@ -105,7 +104,7 @@ JpegWalk::JpegWalk(WalkedBytes file, uint64_t mostGarbage)
   if (!ByteReader(file_.At(0, 2)).Match("\xFF\xD8")) End(Status::DamagedFile);
 }
 
-// Moves to the FF of the next marker. False if there is too much garbage in front of it.
+// Advances to the FF of the next marker. False if there is too much garbage before it.
 bool JpegWalk::FindMarker(uint64_t& at, std::span<const uint8_t>& bytes) {
   for (;; ++at) {
     bytes = file_.At(at, WalkedBytes::kMost);

@@ -13,23 +13,23 @@ namespace fotomill {
 // PNG specification, section 5.2.
 inline constexpr std::string_view kPngSignature("\x89PNG\r\n\x1a\n", 8);
 
-// Where a chunk is in its file; it may claim more than there is.
+// Position of a chunk in its file; its size may exceed the file.
 struct PngPlace {
-  std::string_view type;  // until the next chunk, where the file is not in memory
+  std::string_view type;  // valid until the next chunk if the file is not in memory
   uint64_t data = 0, size = 0;
-  uint64_t End() const { return data + size + 4; }  // behind the CRC
+  uint64_t End() const { return data + size + 4; }  // after the CRC
 };
 
-// Walks the chunks of a file from its signature to IEND, the last one. CRCs are not checked.
+// Iterates over the chunks of a file from its signature through IEND. CRCs are not checked.
 class PngWalk {
  public:
   explicit PngWalk(WalkedBytes file);
   // The next chunk; false at the end.
   bool Next(PngPlace& chunk);
-  // Why the walk ended: Ok behind IEND; DamagedFile (2) at what is no chunk; FileReadError (3)
-  // where the file ends.
+  // Why the walk ended: Ok after IEND; DamagedFile (2) at an invalid chunk; FileReadError (3) at
+  // the end of the file.
   Status Outcome() const { return outcome_; }
-  // Whether it ended because reading failed.
+  // Whether it ended because of a read error.
   bool ReadFailed() const { return file_.Failed(); }
 
  private:
@@ -47,7 +47,7 @@ struct PngChunk {
   std::span<const uint8_t> data;
 };
 
-// Walks the chunks of a file in memory as far as they are whole.
+// Iterates over the complete chunks of a file in memory.
 class PngChunks {
  public:
   explicit PngChunks(std::span<const uint8_t> file) : file_(file), walk_(file) {}

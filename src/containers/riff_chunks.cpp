@@ -1,10 +1,10 @@
-// RIFF, little-endian: "RIFF", the length of the rest (4 bytes), a form of four letters, then
+// RIFF, little-endian: "RIFF", the size of the rest (4 bytes), a form type of four letters, then
 // chunks.
 //
 //   offset size  field
 //        0    4  name
-//        4    4  length of the data
-//        8       data, and a byte of padding behind an odd length
+//        4    4  size of the data
+//        8       data, padded to an even size
 // Source: IBM and Microsoft, "Multimedia Programming Interface and Data Specifications 1.0" (1991).
 #include "containers/riff_chunks.h"
 

@@ -9,9 +9,9 @@
 
 namespace fotomill {
 
-// What a container is walked in: a file in memory, or one of which only the head is there. Beyond
-// the head, bytes are read where a walk comes by, at limits.walkedPlaces places at most. Owns
-// neither.
+// The input of a container walk: a file in memory, or one of which
+// only the head is. Beyond the head, bytes are read on demand, at
+// no more than limits.walkedPlaces offsets. Owns neither.
 class WalkedBytes {
  public:
   WalkedBytes(std::span<const uint8_t> file) : held_(file), size_(file.size()) {}
@@ -21,10 +21,10 @@ class WalkedBytes {
   static constexpr uint64_t kMost = 16;
   // Of the whole file, in bytes.
   uint64_t Size() const { return size_; }
-  // The bytes from `offset` on: `count`, at most kMost, or as many as there are. Those that are not
-  // in memory stay until the next call.
+  // `count` bytes from `offset`, at most kMost, fewer at the end. Bytes that are not in memory are
+  // valid until the next call.
   std::span<const uint8_t> At(uint64_t offset, uint64_t count);
-  // Whether bytes that the file should have could not be read.
+  // Whether a read error occurred.
   bool Failed() const { return failed_; }
 
  private:
@@ -32,11 +32,11 @@ class WalkedBytes {
   uint64_t size_ = 0;
   const platform::FileView* file_ = nullptr;
   std::array<uint8_t, kMost> read_ = {};
-  uint32_t places_ = 0;  // read so far
+  uint32_t places_ = 0;  // offsets read so far
   bool failed_ = false;
 };
 
-// Bytes as the text that they are, such as a chunk's name.
+// Bytes as text, such as a chunk's name.
 inline std::string_view TextOf(std::span<const uint8_t> bytes) {
   return {static_cast<const char*>(static_cast<const void*>(bytes.data())), bytes.size()};
 }

@@ -7,8 +7,8 @@ namespace fotomill {
 
 namespace {
 
-constexpr double kFraction = 64;           // FreeType and HarfBuzz count in 64ths of a pixel
-constexpr double kMostEm = 20000;          // FreeType's coordinates have 16 bits of pixels
+constexpr double kFraction = 64;           // FreeType and HarfBuzz use 64ths of a pixel
+constexpr double kMostEm = 20000;          // FreeType pixel coordinates are 16-bit
 
 }  // namespace
 

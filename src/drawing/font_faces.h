@@ -14,8 +14,8 @@
 
 namespace fotomill {
 
-// The fonts that one text is drawn with, at one size: that of its family, and as they are needed
-// those that stand in for what it lacks. Belongs to one thread.
+// The fonts used to draw a text at one size: its family's font, plus fallback fonts as needed for
+// missing characters. Not thread-safe.
 class FontFaces {
  public:
   FontFaces() = default;
@@ -23,21 +23,21 @@ class FontFaces {
   FontFaces(const FontFaces&) = delete;
   FontFaces& operator=(const FontFaces&) = delete;
 
-  // Opens a family (see FontFiles) with an em of so many pixels; or with lines so many pixels high,
-  // from the top of the tallest letters to the bottom of the deepest. ResourceError if there is no
-  // font, or HarfBuzz or fontconfig is not installed.
+  // Opens a family (see FontFiles) with the given em size, or line height, in pixels; the line
+  // height is measured from the top of the tallest letters to the bottom of the deepest.
+  // ResourceError if there is no font, or HarfBuzz or fontconfig is not installed.
   Status OpenForEm(std::string_view family, double em);
-  Status OpenForLine(std::string_view family, double height);  // likewise
+  Status OpenForLine(std::string_view family, double height);  // as above
 
   double Em() const { return em_; }             // pixels, of all faces
-  double Ascent() const { return ascent_; }     // pixels above the baseline, of the family
+  double Ascent() const { return ascent_; }     // pixels above the baseline, of the family's font
   double Descent() const { return descent_; }   // pixels below it
   FT_Library Library() const { return library_; }
   FT_Face Outlines(size_t face) const { return faces_[face].outlines; }
   hb_font_t* Shaper(size_t face) const { return faces_[face].shaper; }
 
-  // The first face that has all of some characters, else the first that has the first of them, else
-  // the family's.
+  // The first face that has all of the characters, else the first that has the first of them, else
+  // the family's own.
   size_t FaceFor(std::span<const char32_t> characters);
 
  private:
@@ -56,7 +56,7 @@ class FontFaces {
   const HarfBuzz* shaping_ = nullptr;
   FT_Library library_ = nullptr;
   std::shared_ptr<const FontFiles> files_;
-  std::vector<Face> faces_;  // the first is the family's
+  std::vector<Face> faces_;  // the first is the family's own
   double em_ = 0, ascent_ = 0, descent_ = 0;
 };
 

@@ -11,9 +11,9 @@ namespace fotomill {
 
 namespace {
 
-constexpr int kCollectionIndex = 0xffff;  // the upper bits choose an instance of a variable font
+constexpr int kCollectionIndex = 0xffff;  // the upper bits select an instance of a variable font
 
-// A family and what its last words say about weight and slant.
+// A family, with the weight and slant named by its last words.
 struct Wanted {
   std::string family;
   int weight = FC_WEIGHT_REGULAR, slant = FC_SLANT_ROMAN;
@@ -43,7 +43,7 @@ const FcChar8* FcText(const char* text) { return reinterpret_cast<const FcChar8*
 struct FontFiles::List {
   struct Entry {
     FontFile file;
-    FcCharSet* characters;  // of the set below
+    FcCharSet* characters;  // owned by the set below
   };
   const Fontconfig* fontconfig = LoadedFontconfig();
   FcFontSet* set = nullptr;
@@ -101,7 +101,7 @@ bool FontFiles::Has(size_t index, char32_t character) const {
 }
 
 std::shared_ptr<const FontFiles> FontFiles::Of(std::string_view family) {
-  (void)LoadedFontconfig();  // loaded before the map is made, and so unloaded after its end
+  (void)LoadedFontconfig();  // loaded before the map is created, so unloaded after it is destroyed
   static std::mutex mutex;
   static std::map<std::string, std::shared_ptr<const FontFiles>, std::less<>> known;
   const std::scoped_lock lock(mutex);

@@ -7,19 +7,19 @@
 
 namespace fotomill {
 
-// A font of the system: its file, and which of the fonts in it.
+// A system font: its file, and the index of the font in it.
 struct FontFile {
   std::string path;
   int32_t index = 0;
 };
 
-// The fonts of the system for one family, the best one first and those that stand in for letters
-// that it lacks behind it. Only fonts with outlines count (TrueType and OpenType).
+// The system's fonts for one family, the best match first, followed by fallbacks for missing
+// characters. Only outline fonts (TrueType and OpenType).
 class FontFiles {
  public:
-  // Fonts for a family as people write it: "Arial", "DejaVu Sans Bold", "Georgia Italic". Where the
-  // system has no such family, the one that fontconfig takes for it comes first. Empty when the
-  // system has no font, or no fontconfig. Kept for the next call; from any thread.
+  // Fonts for a family by its common name: "Arial", "DejaVu Sans Bold", "Georgia Italic". If the
+  // family is not installed, fontconfig's substitute comes first. Empty if there are no fonts or no
+  // fontconfig. Cached; thread-safe.
   static std::shared_ptr<const FontFiles> Of(std::string_view family);
 
   explicit FontFiles(std::string_view family);
@@ -29,7 +29,7 @@ class FontFiles {
 
   size_t Count() const;
   const FontFile& At(size_t index) const;
-  // Whether a font has a character.
+  // Whether a font has a glyph for a character.
   bool Has(size_t index, char32_t character) const;
 
  private:

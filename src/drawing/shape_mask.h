@@ -6,16 +6,16 @@
 
 namespace fotomill {
 
-// A rectangle anywhere, turned about its center and with rounded corners.
+// A rectangle, rotated about its center, with rounded corners.
 struct Shape {
   double x = 0, y = 0;  // its center, in pixels from the mask's top left corner
   double width = 0, height = 0;
   double angle = 0;     // degrees, clockwise
-  double radius = 0;    // of the corners; more than half an edge counts as half of it
+  double radius = 0;    // corner radius; limited to half the shorter edge
 };
 
-// How much of each pixel a shape covers. Edges along pixels are sharp, others smooth over one
-// pixel. Source: the signed distance of a rounded box, I. Quilez, "2D distance functions".
+// Coverage of each pixel by a shape. Edges along pixel boundaries are sharp, others anti-aliased
+// over one pixel. Source: the signed distance of a rounded box, I. Quilez, "2D distance functions".
 class ShapeCoverage {
  public:
   explicit ShapeCoverage(const Shape& shape);
@@ -26,9 +26,9 @@ class ShapeCoverage {
   const double cosine_, sine_, radius_;
 };
 
-// Adds a shape to an alpha plane: each pixel gets the larger of what it has and its coverage.
+// Adds a shape to an alpha plane: each pixel becomes the maximum of its value and its coverage.
 void DrawShape(const Shape& shape, PackedImage& mask);
-// Takes a shape out of an alpha plane.
+// Removes a shape from an alpha plane.
 void CutShape(const Shape& shape, PackedImage& mask);
 
 }  // namespace fotomill

@@ -14,7 +14,7 @@ namespace {
 constexpr char32_t kUnknown = 0xFFFD;
 constexpr double kFraction = 64;
 
-// Whether a line may end before and behind a character that is no blank.
+// Whether a line may be broken before and after a non-blank character.
 bool IsIdeograph(char32_t c) {
   return (c >= 0x2E80 && c <= 0x9FFF) || (c >= 0xAC00 && c <= 0xD7A3) ||
          (c >= 0xF900 && c <= 0xFAFF) || (c >= 0xFF01 && c <= 0xFF60) ||
@@ -26,8 +26,8 @@ std::string_view WithoutBlanksBehind(std::string_view text) {
   return text;
 }
 
-// The bytes up to the next place where a line may end: a word with the blanks behind it, or an
-// ideograph.
+// The bytes up to the next line break opportunity: a word with the blanks after it,
+// or an ideograph.
 size_t PieceLength(std::string_view text) {
   std::string_view rest = text;
   bool blank = false;
@@ -71,7 +71,7 @@ class Breaker {
     const TextLine line = font_.Shape(WithoutBlanksBehind(text), layout_.spacing);
     return line.width <= layout_.width * kFraction;
   }
-  // As many characters as fit, one at least.
+  // As many characters as fit, at least one.
   size_t LongestStart(std::string_view word) {
     size_t length = 0;
     for (std::string_view rest = word; !rest.empty();) {

@@ -4,7 +4,7 @@ namespace fotomill {
 
 namespace {
 
-// Loads a library and all its functions; `table` is left without a library when one is missing.
+// Loads a library and all its functions; `table` has no library if one of them is missing.
 #define FOTOMILL_FIND(name)                                                             \
   table.name = table.library.template FunctionNamed<decltype(::name)>(#name);           \
   whole = whole && table.name != nullptr;

@@ -8,8 +8,8 @@
 
 #include "platform/shared_library.h"
 
-// HarfBuzz, which shapes text, and fontconfig, which finds fonts. They are loaded when the first
-// text is drawn, since linking them would make every start of the program slower.
+// HarfBuzz (text shaping) and fontconfig (font lookup), loaded when text is first drawn, as linking
+// them would slow down every start of the program.
 namespace fotomill {
 
 // clang-format off
@@ -31,13 +31,13 @@ namespace fotomill {
 
 #define FOTOMILL_MEMBER(name) decltype(::name)* name = nullptr;
 
-// The functions of HarfBuzz that the program calls, under their own names.
+// The HarfBuzz functions the program uses, under their own names.
 struct HarfBuzz {
   platform::SharedLibrary library;
   HARFBUZZ_FUNCTIONS(FOTOMILL_MEMBER)
 };
 
-// The functions of fontconfig that the program calls, under their own names.
+// The fontconfig functions the program uses, under their own names.
 struct Fontconfig {
   platform::SharedLibrary library;
   FONTCONFIG_FUNCTIONS(FOTOMILL_MEMBER)
@@ -45,9 +45,9 @@ struct Fontconfig {
 
 #undef FOTOMILL_MEMBER
 
-// The libraries, loaded at the first call; null where one is not installed or too old. They stay
-// loaded until the program ends. From any thread.
+// The libraries, loaded at the first call; null if not installed or too old. They stay loaded until
+// the program ends. Thread-safe.
 const HarfBuzz* LoadedHarfBuzz();
-const Fontconfig* LoadedFontconfig();  // likewise
+const Fontconfig* LoadedFontconfig();  // as above
 
 }  // namespace fotomill

@@ -15,10 +15,10 @@ namespace fotomill {
 
 namespace {
 
-constexpr double kFraction = 64;  // of a pixel, in FreeType's coordinates
-constexpr double kOne = 65536;    // in its matrices
+constexpr double kFraction = 64;  // pixel units in FreeType's coordinates
+constexpr double kOne = 65536;    // 1.0 in FreeType's matrices
 
-// Adds a piece of a row: the other part of a pixel stays what it was. FreeType counts rows upward.
+// Adds spans of a row; the uncovered part of a pixel keeps its value. FreeType counts rows upward.
 void AddSpans(int y, int count, const FT_Span* spans, void* user) {
   auto& mask = *static_cast<PackedImage*>(user);
   uint8_t* const row = mask.Row(mask.Height() - 1 - y).data();
@@ -30,10 +30,10 @@ void AddSpans(int y, int count, const FT_Span* spans, void* user) {
   }
 }
 
-// An outline of its own points, for boxes and strokes.
+// An outline with its own points, for boxes and strokes.
 struct Points {
   std::vector<FT_Vector> places;
-  // Their types differ between releases of FreeType.
+  // The type differs between FreeType releases.
   std::vector<std::remove_pointer_t<decltype(FT_Outline::tags)>> tags;
   std::vector<std::remove_pointer_t<decltype(FT_Outline::contours)>> ends;
 
@@ -93,7 +93,7 @@ class LineDrawing {
       return DrawOutline(outline, glyph);
     }
     const FT_Face face = fonts_.Outlines(static_cast<size_t>(glyph.face));
-    // Upright letters are fitted to rows, but not to columns: their distances stay even.
+    // Upright text is hinted vertically only, so its spacing stays even.
     const FT_Int32 load = FT_LOAD_NO_BITMAP | (place_.angle == 0 ? FT_LOAD_TARGET_LIGHT
                                                                  : FT_LOAD_NO_HINTING);
     if (FT_Load_Glyph(face, glyph.glyph, load) != 0) return Status::Ok;

@@ -7,9 +7,9 @@
 
 namespace fotomill {
 
-// Adds a line to a mask, which is an alpha plane: 255 where letters cover a pixel wholly. What is
-// outside the mask is left out. `fonts` are those that the line was shaped with.
-// MemoryAllocationError.
+// Adds a line to a mask, which is an alpha plane: 255 where
+// letters fully cover a pixel. Clipped to the mask. `fonts` are
+// the ones the line was shaped with. MemoryAllocationError.
 Status DrawLine(const FontFaces& fonts, const TextLine& line, const LinePlace& place,
                 PackedImage& mask);
 

@@ -16,7 +16,7 @@ namespace {
 constexpr char32_t kUnknown = 0xFFFD;
 constexpr double kFraction = 64;
 
-// Characters of one font, one script and one direction.
+// Characters with the same font, script and direction.
 struct TextRun {
   size_t start, count;
   size_t face;
@@ -67,7 +67,7 @@ class Shaper {
   }
 
  private:
-  // Characters that belong to the one before them: marks, joiners, variation selectors.
+  // Whether a character belongs to the preceding one: marks, joiners, variation selectors.
   bool Continues(char32_t c) const {
     const auto category =
         shaping_.hb_unicode_general_category(shaping_.hb_unicode_funcs_get_default(), c);
@@ -81,7 +81,7 @@ class Shaper {
            HB_UNICODE_GENERAL_CATEGORY_FORMAT;
   }
 
-  // The script of each character; what belongs to none has that of what is before it.
+  // The script of each character; characters without one inherit it from the preceding character.
   std::vector<hb_script_t> Scripts() const {
     std::vector<hb_script_t> scripts(text_.size());
     hb_script_t last = HB_SCRIPT_COMMON;
@@ -115,8 +115,8 @@ class Shaper {
     return runs;
   }
 
-  // Rule L2: from the highest level down to the lowest odd one, what has that level or a higher one
-  // is turned round.
+  // Rule L2: from the highest level down to the lowest odd one, reverses all runs at that
+  // level or higher.
   static void OrderRuns(std::vector<TextRun>& runs) {
     FriBidiLevel highest = 0;
     for (const TextRun& run : runs) highest = std::max(highest, run.level);

@@ -32,7 +32,7 @@ int32_t PackedImage::PixelAt(int32_t x, int32_t y) const {
 Status CheckPackedSize(int32_t width, int32_t height, int32_t bitsPerPixel) {
   if (width < 1 || height < 1) return Status::DamagedFile;
   const int32_t bits = NormalisedDepth(bitsPerPixel);
-  // below 2^64: a stride is below 2^34
+  // cannot overflow 64 bits: a stride is below 2^34
   const uint64_t rowBytes = RowStride(width, bits) * static_cast<uint64_t>(height);
   const uint64_t headBytes = PackedImage::kHeaderSize + (bits == 24 ? 0 : uint64_t{4} << bits);
   const bool fits = rowBytes + headBytes <= limits.packedBlockBytes && rowBytes <= UINT32_MAX;

@@ -9,7 +9,7 @@
 
 namespace fotomill {
 
-// The depth at which a picture of `bitsPerPixel` is held: 1, 4 (from 2), 8 (from 5) or 24 bits.
+// The in-memory depth of a picture of `bitsPerPixel`: 1, 4 (from 2), 8 (from 5) or 24 bits.
 constexpr int32_t NormalisedDepth(int32_t bitsPerPixel) {
   if (bitsPerPixel == 1) return 1;
   if (bitsPerPixel >= 2 && bitsPerPixel <= 4) return 4;
@@ -17,7 +17,7 @@ constexpr int32_t NormalisedDepth(int32_t bitsPerPixel) {
   return 24;
 }
 
-// Bytes of one row of `width` pixels of `bits`, padded to a multiple of 4.
+// Bytes per row of `width` pixels of `bits`, padded to a multiple of 4.
 constexpr uint64_t RowStride(int32_t width, int32_t bits) {
   return (static_cast<uint64_t>(width) * static_cast<uint64_t>(bits) + 31) / 32 * 4;
 }
@@ -37,14 +37,14 @@ constexpr uint64_t RowStride(int32_t width, int32_t bits) {
 //       40    4 x colors  blue, green, red, 0
 //        .    rows         each padded to a multiple of 4 bytes; 24-bit pixels are blue, green, red
 //
-// Pixels of less than 8 bits lie in a byte from the most significant bit down. The holder owns the
+// Pixels of less than 8 bits are packed from the most significant bit down. The object owns the
 // block.
 class PackedImage {
  public:
   static constexpr uint64_t kHeaderSize = 40;
 
-  bool Empty() const { return block_.Empty(); }  // no block: there is no picture
-  void Free() { *this = PackedImage(); }  // gives the memory back; empty afterwards
+  bool Empty() const { return block_.Empty(); }  // no block, no picture
+  void Free() { *this = PackedImage(); }  // frees the memory; empty afterwards
 
   int32_t Width() const { return width_; }  // pixels
   int32_t Height() const { return height_; }  // rows
@@ -53,7 +53,7 @@ class PackedImage {
   int32_t Colors() const { return bits_ == 24 ? 0 : 1 << bits_; }
   uint64_t Stride() const { return stride_; }  // bytes
 
-  // Row y counted from the top, and row r in stored order, from the bottom. `stride` bytes each.
+  // Row y from the top, and row r in stored order, from the bottom; `stride` bytes each.
   std::span<uint8_t> Row(int32_t y) { return StoredRow(height_ - 1 - y); }
   std::span<const uint8_t> Row(int32_t y) const { return StoredRow(height_ - 1 - y); }
   std::span<uint8_t> StoredRow(int32_t r) {
@@ -76,7 +76,7 @@ class PackedImage {
     return block_.Bytes().subspan(kHeaderSize, RowsOffset() - kHeaderSize);
   }
 
-  // The value at column x, row y from the top: an index, or 0x00RRGGBB of a 24-bit picture; -1
+  // The value at column x, row y from the top: a palette index, or 0x00RRGGBB for 24 bits; -1
   // outside the picture.
   int32_t PixelAt(int32_t x, int32_t y) const;
 
@@ -90,29 +90,29 @@ class PackedImage {
   uint64_t stride_ = 0;
 };
 
-// Whether a picture of that size can be held at all, without taking memory: Ok, DamagedFile when
-// width or height is below 1, MemoryAllocationError when its block would exceed the limit.
+// Checks a picture's size without allocating: Ok, DamagedFile if width or height is below 1,
+// MemoryAllocationError if the block would exceed the limit.
 Status CheckPackedSize(int32_t width, int32_t height, int32_t bitsPerPixel);
 
-// Bytes of the rows of such a picture, without its head.
+// Bytes of the rows of such a picture, without the header.
 constexpr uint64_t PackedRowBytes(int32_t width, int32_t height, int32_t bitsPerPixel) {
   return RowStride(width, NormalisedDepth(bitsPerPixel)) * static_cast<uint64_t>(height);
 }
-// Whether one file may take so many bytes for all that is held at a time: MemoryAllocationError (6)
-// when not. Codecs ask with what the header promises, their library's memory included, before they
-// take any of it.
+// Checks the peak memory needed for one file against the limit: MemoryAllocationError (6) if it is
+// exceeded. Codecs call it with what the header implies, their library's memory included, before
+// allocating anything.
 Status CheckFileMemory(uint64_t bytes);
 
-// Makes the packed block of a picture at the normalised depth of `bitsPerPixel`, with its color
-// table taken from `palette` (zero without one) and its rows zero; with Fill::Unset the rows hold
-// anything, for callers that write every byte of them, padding included. DamagedFile when width or
-// height is below 1, MemoryAllocationError when the block would exceed the limit or cannot be had;
-// `image` is empty then.
+// Allocates a picture at the normalised depth of `bitsPerPixel`, its color table filled from
+// `palette` (zero if null) and its rows zero; with Fill::Unset the rows are uninitialized, for
+// callers that write every byte of them, padding included. DamagedFile if width or height is
+// below 1, MemoryAllocationError if the block exceeds the limit or cannot be allocated; `image`
+// is empty then.
 Status NewPackedImage(int32_t width, int32_t height, const Palette* palette, int32_t bitsPerPixel,
                       PackedImage& image, platform::Fill fill = platform::Fill::Zero);
 
-// An 8-bit image of the same size as a picture, with the gray ramp as its palette: the form of an
-// alpha plane, whose values run from 0, transparent, to 255. Statuses as NewPackedImage.
+// An alpha plane: an 8-bit image with the gray ramp as its palette, values from 0 (transparent) to
+// 255 (opaque). Statuses as NewPackedImage.
 Status NewAlphaPlane(int32_t width, int32_t height, PackedImage& plane,
                      platform::Fill fill = platform::Fill::Zero);
 

@@ -11,7 +11,7 @@ struct Rgb {
   uint8_t red, green, blue;
 };
 
-// Appends colors to a palette, or only counts them when there is none.
+// Appends colors to a palette, or only counts them if it is null.
 class PaletteFiller {
  public:
   explicit PaletteFiller(Palette* palette) : palette_(palette) {
@@ -29,7 +29,7 @@ class PaletteFiller {
   void AddAll(std::span<const Rgb> colors) {
     for (const Rgb& color : colors) Add(color);
   }
-  // Every combination of the levels; the first channel changes slowest.
+  // Every combination of the levels; the first channel varies slowest.
   void AddCube(std::span<const uint8_t> reds, std::span<const uint8_t> greens,
                std::span<const uint8_t> blues) {
     for (const uint8_t red : reds) {
@@ -61,7 +61,7 @@ constexpr Rgb kVga[] = {{0, 0, 0},          {0x80, 0, 0},    {0, 0x80, 0},    {0
                         {0xc0, 0xc0, 0xc0}, {255, 0, 0},     {0, 255, 0},     {255, 255, 0},
                         {0, 0, 255},        {255, 0, 255},   {0, 255, 255},   {255, 255, 255}};
 
-// `count` grays between black and white, neither of which is among them.
+// `count` evenly spaced grays between black and white, excluding both.
 void AddInnerGrays(PaletteFiller& filler, int32_t count) {
   for (int32_t i = 1; i <= count; ++i) {
     const auto level = static_cast<uint8_t>((i * 255 + (count + 1) / 2) / (count + 1));

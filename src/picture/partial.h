@@ -7,9 +7,9 @@
 
 namespace fotomill {
 
-// For readers, of a picture whose rows ended with `status` after `rows` whole ones: what to return.
-// Ok where the data ended early or are broken and a part of the picture will do; the record's
-// `shortfall` says why it is one.
+// For readers: the status to return for a picture whose decoding ended with `status` after `rows`
+// complete rows. Ok if the data are truncated or damaged and a partial picture is acceptable; the
+// record's `shortfall` then holds the reason.
 inline Status TakePart(PictureRecord& picture, bool partial, Status status, int64_t rows) {
   const bool ended = status == Status::FileReadError || status == Status::DamagedFile;
   if (!ended || !partial || rows < 1) return status;

@@ -9,45 +9,45 @@
 
 namespace fotomill {
 
-// Whether a file whose name lies is opened by what it holds.
+// Whether a file with the wrong extension is identified by its contents.
 struct IdentifyOptions {
   bool on = true;  // IdentifyMysteryViewFiles
-  // BatchIdentifyExceptions: extensions between semicolons whose files are never opened that way
+  // BatchIdentifyExceptions: extensions, separated by semicolons, that are never identified
   std::string exceptions = "EXE;THN;SCR;DLL;VBX;CPL;DB";
-  int32_t mostSide = 32000;  // MaximumMysteryFileDimension: larger pictures are refused, pixels
+  int32_t mostSide = 32000;  // MaximumMysteryFileDimension: larger pictures are rejected, pixels
   bool operator==(const IdentifyOptions&) const = default;
 };
 
-// What of the settings decoding depends on. The values here are the settings' defaults; a job takes
-// those in force once, by ReadOptionsFromSettings.
+// The settings that decoders use. The values here are the settings' defaults; a job copies the
+// current ones once, with ReadOptionsFromSettings.
 struct ReadOptions {
-  bool alphaChannels = true;            // UseAlphaChannels: the fourth channel of bitmaps is alpha
-  bool recognizeApng = true;            // RecognizeAPNG: the frames of a PNG file are counted
-  // AlphaBackground, 0x00BBGGRR: what the record's `defaultColour` becomes
+  bool alphaChannels = true;            // UseAlphaChannels: the fourth channel of bitmaps
+  bool recognizeApng = true;            // RecognizeAPNG: count the frames of a PNG file
+  // AlphaBackground, 0x00BBGGRR: initial `defaultColour` of the record
   uint32_t alphaBackground = 0xffffff;
   IdentifyOptions identify = {};
-  // PhotoCDResolution: the largest size that is taken out of a Photo CD file
+  // PhotoCDResolution: the largest size to read from a Photo CD file
   int32_t photoCdSize = choice::kPhotoCd3072;
-  bool textInverted = false;     // InvertTextFiles: texts are white on black
-  bool relaxedUuencode = false;  // RelaxedUUE: cut lines and stray text are passed over
+  bool textInverted = false;     // InvertTextFiles: render text white on black
+  bool relaxedUuencode = false;  // RelaxedUUE: skip truncated lines and stray text
   bool operator==(const ReadOptions&) const = default;
 };
 
-// What a reader is asked for; the record is its answer.
+// What to read, and how.
 struct ReadRequest {
   std::string fileName = {};
-  int32_t page = 0;           // of files with several, from 0
+  int32_t page = 0;           // of a multi-page file, from 0
   int32_t thumbnailSide =
-      0;  // above 0: a decoder may deliver any smaller size that is still twice that of the largest
-          // picture inside this square, which is what its longer edge decides; the record's `width`
-          // and `height` keep the full size, `image` tells its own
-  bool signedOnly = false;  // of `info`: a format that knows its files by no signature answers
-                            // UnsupportedFormat (8) without opening the file
-  // A picture whose data end early is delivered as far as it goes: Ok, with `shortfall` in the
-  // record. At least one row of it is there.
+      0;  // above 0: the decoder may deliver a reduced picture, as long as it is at least twice the
+          // size of the picture fitted into a square of this edge length; the record's `width` and
+          // `height` remain the full size, `image` has its own
+  bool signedOnly = false;  // for `info`: formats without a signature return UnsupportedFormat (8)
+                            // without opening the file
+  // Deliver a truncated picture as far as it could be decoded: Ok, with `shortfall` set in the
+  // record. It has at least one row.
   bool partial = false;
   ProgressSink* progress = nullptr;  // not owned, may be null
-  StopToken stop = {};               // asked between rows; the status is FunctionCancelled (4) then
+  StopToken stop = {};               // checked between rows; then FunctionCancelled (4)
   ReadOptions options = {};
 };
 

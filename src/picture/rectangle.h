@@ -4,7 +4,7 @@
 
 namespace fotomill {
 
-// An upright rectangle in pixels, y downward.
+// An axis-aligned rectangle in pixels, y downward.
 struct Rectangle {
   int32_t x = 0, y = 0, width = 0, height = 0;
   bool operator==(const Rectangle&) const = default;

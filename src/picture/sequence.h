@@ -10,22 +10,22 @@ namespace fotomill {
 
 struct PictureRecord;
 
-// What is known of a file with several pictures before it is written.
+// Facts about a multi-picture file that must be known before writing.
 struct SequenceFacts {
-  size_t count = 0;       // of pictures, at least one
-  bool animated = false;  // they are frames of one size, played in time
-  int32_t rounds = 0;     // how often frames are to be played, 0 for ever
+  size_t count = 0;       // pictures, at least one
+  bool animated = false;  // they are the frames of an animation, all of one size
+  int32_t rounds = 0;     // number of times the animation plays, 0 for endless
 };
 
-// A file with several pictures in the making. Codecs derive from this. Without a successful Finish
-// the file never appears.
+// Writes a file with several pictures. Codecs derive from this. Without a successful Finish, no
+// file is created.
 class SequenceWriter {
  public:
   virtual ~SequenceWriter() = default;
-  // Appends a picture; frames are shown for `delayMs`. UnsuitableImage (13) for a frame of another
-  // size than the first, else what writing a single picture returns.
+  // Appends a picture; frames are shown for `delayMs`. UnsuitableImage (13) if a frame differs in
+  // size from the first, else the statuses of writing a single picture.
   virtual Status Add(PictureRecord& picture, int32_t delayMs) = 0;
-  // Completes the file and gives it its name, as the options say.
+  // Completes the file and renames it to its final name, as the options say.
   virtual Status Finish() = 0;
 };
 using SequencePointer = std::unique_ptr<SequenceWriter>;  // null if there is none

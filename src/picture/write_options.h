@@ -10,29 +10,29 @@
 
 namespace fotomill {
 
-// What a writer is asked for.
+// How to write a picture.
 struct WriteOptions {
-  // as the settings were when the job began
+  // the settings when the job started
   EncodeOptions encode = {};
-  // what to do about a file of the destination's name
+  // what to do if the destination exists
   platform::Existing existing = platform::Existing::Replace;
-  // EXIF, XMP and the comment of the record go into formats that can hold them; the color profile
-  // always does
+  // store EXIF, XMP and comment if the format
+  // supports them; the color profile is always stored
   bool keepMetadata = true;
-  // without any loss where the format can, whatever `encode` says
+  // lossless if the format supports it, overriding `encode`
   bool lossless = false;
-  // the comment of the record goes into files of plug-in formats
+  // store the comment in files of plug-in formats
   bool comment = false;
-  std::string password = {};           // for formats that can be protected; empty: none
-  // called when the new file is whole, before it gets its name; false: it never does
+  std::string password = {};           // for encrypted formats; empty: none
+  // called when the new file is complete, before it is renamed; false cancels it
   std::function<bool()> makeWay = {};
 
-  // By the call and by the settings.
+  // Depends on the call and on the settings.
   bool KeepsMetadata() const { return keepMetadata && encode.preserveMetadata; }
 };
 
-// The status that a commit's outcome means: ErrorWritingFile when a write failed, ErrorCreatingFile
-// when the name was taken meanwhile and must not be replaced.
+// The status for a commit result: ErrorWritingFile if a write failed, ErrorCreatingFile if the name
+// was taken meanwhile and must not be replaced.
 constexpr Status CommitStatus(platform::CommitResult result) {
   switch (result) {
     case platform::CommitResult::Done: return Status::Ok;
@@ -42,8 +42,8 @@ constexpr Status CommitStatus(platform::CommitResult result) {
   return Status::ErrorWritingFile;
 }
 
-// Commits a writer's file as the options say; statuses as above, and ErrorCreatingFile when no way
-// was made for it.
+// Commits a file as the options say; statuses as above, and ErrorCreatingFile if
+// `makeWay` returned false.
 inline Status CommitOutput(ByteWriter& out, const WriteOptions& options) {
   if (options.makeWay && out.WriteRest() && !options.makeWay()) return Status::ErrorCreatingFile;
   return CommitStatus(out.Commit(options.existing));

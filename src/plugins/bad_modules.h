@@ -4,17 +4,17 @@
 
 namespace fotomill {
 
-// Modules that ended the program while they were loaded, so that this happens once and not at every
-// start. They are in a text file of the data folder, one line for each: size and time of the module
-// file, its path. A module whose file has changed since is tried again.
+// Modules that crashed or exited the program while loading, so that they do not do so at every
+// start. Stored in a text file in the data folder, one line each: size, time and path of the module
+// file. A module whose file has changed is tried again.
 
-// The file; empty without a data folder.
+// Path of the list; empty without a data folder.
 std::string BadModuleFile();
-// A module's line, without its end; empty for a path that no line can hold.
+// A module's line, without line ending; empty if the path cannot be stored in a line.
 std::string BadModuleLine(const std::string& path);
-// Whether the module as it is now is in the file.
+// Whether the module, in its current state, is listed.
 bool IsBadModule(const std::string& path);
-// Takes a module out of the file, by its file name: it is tried again. False when the file cannot
+// Removes a module from the list by file name, so that it is tried again. False if the list cannot
 // be written.
 [[nodiscard]] bool ForgiveModule(const std::string& name);
 

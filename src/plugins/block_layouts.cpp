@@ -1,14 +1,14 @@
-// The layouts that modules see, checked byte by byte where pointers have 4 bytes, and shifted by
-// the wider pointers where they have 8.
+// Checks the layouts of the plug-in ABI field by field: exact offsets with 4-byte pointers, shifted
+// accordingly with 8-byte pointers.
 
-// not <cstddef>: this file also compiles without a system, for the other pointer width
+// not <cstddef>: also compiled freestanding, for the other pointer width
 #include <stddef.h>
 
 #include "plugins/fotomill_plugin.h"
 
 namespace {
 
-// bytes that each pointer field has beyond the 4 of the base layout
+// extra bytes per pointer field compared to the 32-bit layout
 constexpr size_t kWider = sizeof(void*) - 4;
 
 static_assert(sizeof(FMW_PLUGIN_PARAMS) == 863 + kWider);

@@ -9,7 +9,7 @@ namespace fotomill {
 
 namespace {
 
-std::recursive_mutex& CallMutex() {  // recursive: a module may load pictures through the program
+std::recursive_mutex& CallMutex() {  // recursive: a module may load pictures
   static std::recursive_mutex mutex;
   return mutex;
 }

@@ -7,12 +7,12 @@
 
 namespace fotomill {
 
-// When the code of a module runs. What ends the program while a module is loaded would end it at
-// every start, so it is remembered (bad_modules.h).
+// Phase of a module call. A module that ends the program while loading would do so at every start,
+// so it is recorded (bad_modules.h).
 enum class ModuleStage { Loading, Working };
 
-// Held during every call into a module: modules need not be re-entrant, so there is one call at a
-// time, and a module that ends the program is named (platform/module_guard.h).
+// Held during every call into a module: modules need not be reentrant, so calls are serialized, and
+// a module that ends the program is reported by name (platform/module_guard.h).
 class ModuleCall {
  public:
   ModuleCall(const std::string& modulePath, ModuleStage stage);

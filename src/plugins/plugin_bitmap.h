@@ -8,16 +8,16 @@
 
 namespace fotomill {
 
-// Takes over a device-independent bitmap that a module returned: a BITMAPINFOHEADER of at least 40
+// Converts a device-independent bitmap returned by a module: a BITMAPINFOHEADER of at least 40
 // bytes, 1, 4, 8, 24 or 32 bits, uncompressed, bottom-up or top-down. The fourth byte of 32-bit
-// pixels goes into `alpha`. DamagedFile (2) when the block is smaller than its header claims or the
-// header makes no sense, UnsupportedFormat (8) for other depths and for compression,
+// pixels goes into `alpha`. DamagedFile (2) if the block is smaller than its header claims or the
+// header is invalid, UnsupportedFormat (8) for other depths and for compression,
 // MemoryAllocationError (6). `palette` receives the colors of up to 8 bits.
 Status TakeModuleBitmap(std::span<const uint8_t> block, PackedImage& image, PackedImage& alpha,
                         Palette& palette);
 
-// The same the other way: a new module block with the packed bitmap of a picture, at 32 bits when
-// there is an alpha plane. The caller frees it with platform::FreeModuleBlock. Null without memory.
+// The reverse: a new module block with the packed bitmap of a picture, 32 bits if there is an alpha
+// plane. The caller frees it with platform::FreeModuleBlock. Null if memory runs out.
 void* NewModuleBitmap(const PackedImage& image, const PackedImage& alpha);
 
 }  // namespace fotomill

@@ -19,14 +19,14 @@ namespace fotomill {
 
 namespace {
 
-// What modules see of the settings.
+// The settings table passed to modules.
 const FMW_CONFIG_ENTRY* configuration = nullptr;
 int32_t configurationCount = 0;
 
-// The picture whose call is running on this thread; the progress entries have no argument that
-// could tell.
+// The picture of the call running on this thread; the progress callbacks have no argument to
+// identify it.
 thread_local PictureRecord* currentPicture = nullptr;
-// How it is read; pictures that the module loads meanwhile are read alike.
+// Its read options, also used for pictures that the module loads meanwhile.
 thread_local const ReadOptions* currentOptions = nullptr;
 
 ReadOptions CurrentOptions() { return currentOptions == nullptr ? ReadOptions() : *currentOptions; }
@@ -60,7 +60,7 @@ void FMW_CALL HostSetStatus(const char* text) {
     progress->SetText(text);
 }
 
-// One call into a module about a picture: names it, and carries the service block.
+// One call into a module for a picture: sets the picture's name and holds the service block.
 class PictureCall {
  public:
   PictureCall(const PluginEntry& entry, PictureRecord& picture,
@@ -97,8 +97,7 @@ class PictureCall {
   FMW_HOST_SERVICES services_ = {};
 };
 
-// A module's error number as a status. A module that fails without a number has at least not
-// succeeded.
+// Converts a module's error number to a status. A failure without a number is still a failure.
 Status ModuleError(int32_t error) {
   return error == 0 ? Status::DamagedFile : static_cast<Status>(error);
 }
@@ -130,8 +129,8 @@ Status TakeInfo(const FMW_PICTURE_INFO& info, PictureRecord& picture) {
   return Status::Ok;
 }
 
-// The module that reads a file: that of its name or, for a name that no module claims, the one that
-// the registry bound for the contents. Null if there is none.
+// The module that reads a file: by file name or, if no module claims the name, the one the registry
+// bound by content. Null if there is none.
 const PluginEntry* ReaderOf(std::string_view fileName) {
   const PluginEntry* const named = FindPluginEntry(fileName);
   if (named != nullptr) return named;
@@ -139,7 +138,7 @@ const PluginEntry* ReaderOf(std::string_view fileName) {
   return bound.empty() ? nullptr : FindPluginEntry(std::string("x.").append(bound));
 }
 
-// Lets the module write the picture to `path`.
+// Has the module write the picture to `path`.
 Status CallWriter(const PluginEntry& entry, PictureRecord& picture, const std::string& path,
                   bool withComment) {
   const std::string comment = withComment ? CommentText(picture) : std::string();
@@ -154,8 +153,9 @@ Status CallWriter(const PluginEntry& entry, PictureRecord& picture, const std::s
   return error == 0 ? Status::ErrorWritingFile : static_cast<Status>(error);
 }
 
-// Where the module writes: in a folder of its own, under the destination's name, since some formats
-// keep their name inside. One that would be too long for a module's text is called "picture".
+// The path the module writes to: in a separate folder, but with the destination's file name,
+// as some formats store their own name. A name too long for the plug-in interface is
+// replaced by "picture".
 std::string WorkingName(const std::string& folder, const std::string& destination) {
   std::string path = platform::JoinFolder(folder, platform::FileNameOf(destination));
   if (path.size() > PathText::Capacity()) {
@@ -165,7 +165,7 @@ std::string WorkingName(const std::string& folder, const std::string& destinatio
   return path;
 }
 
-// Whether the module recognizes what it has written. One that only writes says that it cannot tell.
+// Whether the module recognizes the file it has written. Write-only modules cannot tell and pass.
 bool ReadsBack(const PluginEntry& entry, const std::string& path) {
   FMW_PICTURE_INFO info = {};
   info.size = sizeof info;
@@ -177,9 +177,9 @@ bool ReadsBack(const PluginEntry& entry, const std::string& path) {
          error == FMW_ERROR_UNSUPPORTED || error == FMW_ERROR_FORMAT;
 }
 
-// What a module may say about its formats; the other bits of a row are the program's own.
+// Flags that a module may set on its formats; all others are set by the program.
 constexpr uint32_t kModuleFlags = FMT_BITMAP | FMT_MULTI | FMT_ALPHA;
-constexpr uint32_t kMostBits = 24;  // of a picture without its alpha
+constexpr uint32_t kMostBits = 24;  // of a picture without alpha
 
 }  // namespace
 
@@ -196,7 +196,7 @@ Status PluginInfo(PictureRecord& picture, const ReadRequest& request) {
     return ModuleError(error);
   picture.fileSize = platform::FactsOf(request.fileName).size;
   RETURN_IF_BAD(TakeInfo(info, picture));
-  (void)PluginComment(picture, request.fileName.c_str());  // a picture does not fail for it
+  (void)PluginComment(picture, request.fileName.c_str());  // a missing comment is not an error
   return Status::Ok;
 }
 

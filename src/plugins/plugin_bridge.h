@@ -7,29 +7,29 @@
 
 namespace fotomill {
 
-// The operations of a format row that is bound to a plug-in format. Each finds the module by the
-// file's extension at the time of the call, so that a picture can go from one plug-in format to
-// another although both use the spare row. All answer UnsupportedFunction (5) when no module serves
-// the extension; a module's own error numbers are passed on.
+// Operations of the spare row while it is bound to a plug-in format. Each looks up the module by
+// file extension at call time, so that a picture can be converted from one plug-in format to
+// another although both use the spare row. UnsupportedFunction (5) if no module handles the
+// extension; a module's own error numbers are passed on.
 
-// Fills the facts and the comment. A comment that cannot be had is left out. DamagedFile (2) when
-// the module claims sizes or depths that no picture has.
+// Reads header facts and comment. A comment that cannot be read is left out. DamagedFile (2) if the
+// module returns impossible sizes or depths.
 Status PluginInfo(PictureRecord& picture, const ReadRequest& request);
-// Decodes into `image`, and `alpha` for 32-bit bitmaps. DamagedFile (2) when the returned bitmap is
-// not what its header claims, MemoryAllocationError (6) when it cannot be locked or held.
+// Decodes into `image`, and into `alpha` for 32-bit bitmaps. DamagedFile (2) if the returned bitmap
+// does not match its header, MemoryAllocationError (6) if it cannot be locked or stored.
 Status PluginRead(PictureRecord& picture, const ReadRequest& request);
-// Lets the module write a working file of the destination's name in a folder of its own, whose
-// contents then become the destination. ErrorWritingFile (11) when the module reports success
-// without a file that it can read itself. Nothing is left of a failed write. The comment goes along
-// where the options say so.
+// Has the module write a temporary file with the destination's name in a separate folder, and then
+// moves its contents to the destination. ErrorWritingFile (11) if the module reports success
+// without a file that it can read itself. A failed write leaves nothing behind. The comment is
+// written if the options say so.
 Status PluginWrite(PictureRecord& picture, const WriteOptions& options);
 
-// Reads the comment inside a file into `picture.comment`. MemoryAllocationError (6) when the
-// returned text cannot be locked; Ok without a comment when the module has none to give.
+// Reads the comment of a file into `picture.comment`. MemoryAllocationError (6) if the returned
+// text cannot be locked; Ok without a comment if the module returns none.
 Status PluginComment(PictureRecord& picture, const char* fileName);
 
-// The configuration keys that modules may read and change, in the layout that they see; not owned.
-// Without this call modules get none.
+// Sets the configuration table that modules may access, in the ABI layout; not owned. Without this
+// call modules get none.
 void InstallPluginConfiguration(const FMW_CONFIG_ENTRY* rows, int32_t count);
 
 // Binds the format of a file's extension to the registry's spare row and returns its index, or

@@ -1,5 +1,5 @@
-// Joins the plug-in table to the registry: modules are loaded the first time that the registry
-// asks.
+// Connects the plug-in table to the registry: modules are loaded when the registry first
+// asks for them.
 
 #include <mutex>
 
@@ -32,7 +32,7 @@ std::vector<PluginFormatFacts> ListForRegistry() {
   std::vector<PluginFormatFacts> formats;
   for (int32_t i = 0; i < PluginFormatCount(); ++i) {
     const PluginEntry& entry = PluginRow(i);
-    // of two modules for one extension the first one serves it
+    // if two modules share an extension, the first one gets it
     if (i > 0 && EqualIgnoringCase(PluginRow(i - 1).extension, entry.extension)) continue;
     formats.push_back(
         {UpperCase(entry.extension.view()), std::string(entry.textB.view()), entry.flags1, entry.exports.writeImage != nullptr});

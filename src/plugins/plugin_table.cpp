@@ -21,7 +21,7 @@ namespace fotomill {
 
 namespace {
 
-// An entry with the load of the module that keeps its exports valid.
+// An entry with the library handle that keeps its exports valid.
 struct LoadedEntry {
   PluginEntry entry;
   platform::SharedLibrary library;
@@ -32,13 +32,13 @@ std::vector<LoadedEntry>& Table() {
   return table;
 }
 
-// Modules that are switched off.
+// Modules disabled by the user.
 std::vector<std::string>& ModulesOff() {
   static std::vector<std::string> names;
   return names;
 }
 
-// Why the system did not load modules of the last scan, by path.
+// System errors from loading modules in the last scan, by path.
 std::map<std::string, std::string>& Unloadable() {
   static std::map<std::string, std::string> reasons;
   return reasons;
@@ -48,7 +48,8 @@ bool IsOn(std::string_view name) {
   return std::ranges::find(ModulesOff(), name) == ModulesOff().end();
 }
 
-// "FMWPL*.so": the names of modules. "_x64" marks the twin of a 32-bit module and is never loaded.
+// "FMWPL*.so", a module's file name. "_x64" marks the 64-bit twin of a 32-bit module and
+// is never loaded.
 bool IsModuleName(std::string_view name) {
   const std::string_view extension = platform::kModuleExtension;
   return name.size() >= 5 + extension.size() && EqualIgnoringCase(name.substr(0, 5), "FMWPL") &&
@@ -76,14 +77,14 @@ PluginExports LookUpExports(const platform::SharedLibrary& library) {
   return exports;
 }
 
-// Texts of a module may come without their zero byte.
+// Texts from modules may lack the terminating NUL.
 template <size_t size>
 std::string_view TextOf(const char (&text)[size]) {
   const std::string_view whole(text, size - 1);
   return whole.substr(0, whole.find('\0'));
 }
 
-// Item `index` of a list separated by one or more ";", empty when there are fewer.
+// Item `index` of a list separated by one or more ";", empty if out of range.
 std::string_view ListItem(std::string_view list, int32_t index) {
   list.remove_prefix(std::min(list.find_first_not_of(';'), list.size()));
   for (; index > 0; --index) {
@@ -95,7 +96,7 @@ std::string_view ListItem(std::string_view list, int32_t index) {
   return list.substr(0, list.find(';'));
 }
 
-// Registers format number `index` of a module. False ends the module's registration.
+// Registers format number `index` of a module. False after the module's last format.
 bool RegisterFormat(const std::string& path, int32_t index, std::vector<LoadedEntry>& table) {
   LoadedEntry loaded;
   const ModuleCall call(path, ModuleStage::Loading);

@@ -11,7 +11,7 @@
 
 namespace fotomill {
 
-// The exports of a module, in the order in which they are looked up; absent ones are null.
+// A module's exports, in lookup order; missing ones are null.
 struct PluginExports {
   FMW_GET_VERSION getVersion = nullptr;
   FMW_GET_COPYRIGHT getCopyright = nullptr;
@@ -25,73 +25,73 @@ struct PluginExports {
 
 // One format of one module: a row of the plug-in table.
 struct PluginEntry {
-  PathText path;           // the module
-  PathText extension;      // the extension that this entry serves, without dot
-  PathText textB;          // the formats' description
-  PathText textA;          // the module's name
-  void* module = nullptr;  // the loaded module; each entry holds its own load of it
+  PathText path;           // the module's file
+  PathText extension;      // without dot
+  PathText textB;          // description of the formats
+  PathText textA;          // name of the module
+  void* module = nullptr;  // the loaded module; each entry holds its own reference
   PluginExports exports;
-  uint32_t flags1 = 0;  // deepest picture that the writer takes, bits per pixel
-  uint32_t flags2 = 0;  // capability bits of the format row, always with FMT_SPARE
+  uint32_t flags1 = 0;  // maximum bits per pixel the writer accepts
+  uint32_t flags2 = 0;  // capability bits of the format row, always including FMT_SPARE
 };
-static_assert(sizeof(void*) != 4 || sizeof(PluginEntry) == 1088);  // as 32-bit plug-ins see it
+static_assert(sizeof(void*) != 4 || sizeof(PluginEntry) == 1088);  // the 32-bit ABI
 
-// At most this many formats of one module are registered.
+// Maximum number of formats registered per module.
 inline constexpr int32_t kFormatsPerModule = 32;
 
-// Where modules are looked for, in this order: the folder "plugin" beside the program as it is
-// built, "lib/fotomill/plugin" of the prefix that it is installed in, and "plugin" in the user's
-// data folder.
+// The module search path, in order: the folder "plugin" next
+// to the program in a build tree, "lib/fotomill/plugin" in the
+// installation prefix, and "plugin" in the user's data folder.
 std::vector<std::string> PluginFolders();
-// Loads every module of `folder` (of PluginFolders() unless one is given; of modules with one name
-// the first) and registers its formats, sorted by extension and then by module path. Modules that
-// lack a required export or refuse are skipped in silence. Returns the number of formats. A second
-// scan replaces the first.
+// Loads every module in `folder` (default: PluginFolders(); of modules with the same name, the
+// first) and registers its formats, sorted by extension and then by module path. Modules that lack
+// a required export or decline are silently skipped. Returns the number of formats. A second scan
+// replaces the first.
 int32_t ScanPlugins(const std::string& folder = {});
-// The modules there, loaded or not, and the user's switch of each: one that is off is passed over
-// by the next scan.
+// The modules found, loaded or not, each with the user's on/off switch; the next scan skips modules
+// that are off.
 struct PluginModule {
-  std::string name;    // of the file
-  std::string folder;  // it is in
+  std::string name;    // file name
+  std::string folder;  // containing folder
   bool on = true;
 };
 std::vector<PluginModule> PluginModules(const std::string& folder = {});
-// Why the last scan could not load a module, by its path; empty where it could.
+// Why the last scan failed to load a module, by path; empty if it was loaded.
 std::string WhyNotLoaded(const std::string& path);
-// The modules that are off, by file name; all others are on.
+// Sets the modules that are off, by file name; all others are on.
 void SetModulesOff(std::vector<std::string> names);
-// By file name; from the next scan on. A module that is switched on is tried again even if it ended
-// the program the last time.
+// By file name; takes effect at the next scan. A module that is switched on is tried again even if
+// it crashed the program before.
 void SwitchModule(const std::string& name, bool on);
-// Unloads every module; formats that are bound to a row must not be used afterwards.
+// Unloads all modules; rows bound to their formats must not be used afterwards.
 void UnloadPlugins();
 
-// Rows of the table, 0 before a scan.
+// Number of rows, 0 before a scan.
 int32_t PluginFormatCount();
-// Row `index` of the table, from 0; it lives until the next scan.
+// Row `index` of the table, from 0; valid until the next scan.
 const PluginEntry& PluginRow(int32_t index);
-// The extension of a row, and the deepest picture that it writes when it can write at all (else 0).
-// False beyond the end.
+// The extension of a row, and the maximum bits per pixel it can write (0 if it cannot write). False
+// past the end.
 bool PluginExtension(int32_t index, std::string& extension, uint32_t& flags1);
-bool PluginTextA(int32_t index, std::string& text);  // the row's first text; false beyond the end
-// The second one: the module's description of its formats.
+bool PluginTextA(int32_t index, std::string& text);  // the module's name; false past the end
+// The module's description of its formats.
 bool PluginTextB(int32_t index, std::string& text);
-// The first entry that serves a file's extension, ignoring case; null when none does.
+// The first entry for a file's extension, ignoring case; null if there is none.
 const PluginEntry* FindPluginEntry(std::string_view fileName);
-// Whether the entry of the file's extension can hold more than one picture (value 4 of flags 2).
+// Whether the entry for the file's extension supports multiple pictures (value 4 of flags 2).
 bool PluginCanHandle(std::string_view fileName);
 
-// Makes the formats of all modules known to the registry. Modules are loaded when a name matches no
-// built-in row, or when a list asks for them, never before. `folder` as for ScanPlugins.
+// Makes plug-in formats available to the registry. Modules are loaded only when a name matches no
+// built-in row or when a list asks for them. `folder` as for ScanPlugins.
 void EnablePlugins(const std::string& folder = {});
 
-// Calls a row's own settings dialog. False when the module offers none; the text to show then is
-// kNothingToConfigure.
+// Opens the module's settings dialog. False if it has none; the text to show
+// then is kNothingToConfigure.
 bool ConfigurePlugin(int32_t index);
 inline constexpr std::string_view kNothingToConfigure =
     TrLater("No configuration items are available for the selected plugin.");
-// The help page of a module beneath the program's folder: "html\NAME", with the system's separator.
-// Empty for a module without a name, or with one that leads elsewhere.
+// The help page of a module below the program's folder: "html\NAME", with the system's separator.
+// Empty for a module without a name, or with an unsafe one.
 std::string PluginHelpPage(int32_t index);
 
 }  // namespace fotomill

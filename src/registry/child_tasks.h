@@ -6,7 +6,7 @@
 
 namespace fotomill {
 
-// What codecs leave to child processes, as their rows say; each task once.
+// Tasks that codecs run in child processes, from their rows, without duplicates.
 std::vector<platform::ApartTask> ChildTasks();
 
 }  // namespace fotomill

@@ -10,22 +10,22 @@ namespace fotomill {
 
 namespace {
 
-// Operations of rows whose codec this build does not have.
+// Operations of rows without a codec in this build.
 Status NoInfo(PictureRecord&, const ReadRequest&) { return Status::UnsupportedFunction; }
 Status NoRead(PictureRecord&, const ReadRequest&) { return Status::UnsupportedFunction; }
 Status NoWrite(PictureRecord&, const WriteOptions&) { return Status::UnsupportedFunction; }
 
-// The fractal format: its coder was never published and is gone.
+// The fractal format: its codec was never published.
 Status UnpublishedInfo(PictureRecord&, const ReadRequest&) { return Status::UnsupportedFormat; }
 Status UnpublishedRead(PictureRecord&, const ReadRequest&) { return Status::UnsupportedFormat; }
 Status UnpublishedWrite(PictureRecord&, const WriteOptions&) { return Status::UnsupportedFormat; }
 
-// The archive rows' hooks: nothing has to be loaded for ZIP; RAR waits for its library.
+// Hooks of the archive rows: ZIP needs nothing loaded; RAR needs its library.
 int32_t Ready() { return 1; }
 int32_t NoStartup() { return 0; }
 
-// A place of the registry. A family of codecs fills it by a row of that extension; the facts of a
-// format that no codec of this build knows stand here.
+// A position in the registry. A codec family with a row of that extension fills it; otherwise the
+// values here are used.
 struct Place {
   std::string_view extension;
   std::string_view description = {};
@@ -36,8 +36,8 @@ struct Place {
   LifeOperation startup = nullptr;  // and shutdown
 };
 
-// The order is behavior: the first row that matches a name wins, so .jpeg is read as JPE and .tiff
-// as TIF.
+// The order matters: the first row that matches a name wins, so .jpeg is read as JPE and
+// .tiff as TIF.
 // clang-format off
 constexpr Place kPlaces[] = {
     {"AVI", "(AVI) Video for Windows", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_ANIMATED | FMT_TIMED | FMT_FRAMES},
@@ -158,7 +158,7 @@ FormatTable MakeFormatTable() {
       if (place == std::end(kPlaces)) continue;
       FormatEntry& entry = table[static_cast<size_t>(place - kPlaces)];
       entry = row;
-      if (entry.write == nullptr) entry.write = NoWrite;  // of formats that are only read
+      if (entry.write == nullptr) entry.write = NoWrite;  // read-only formats
     }
   }
   return table;

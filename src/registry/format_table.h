@@ -10,19 +10,19 @@
 
 namespace fotomill {
 
-inline constexpr int32_t kSpareRow = 77;  // number of SpareRow
-inline constexpr int32_t formatCount = 78;  // rows, the spare one included
+inline constexpr int32_t kSpareRow = 77;  // index of SpareRow
+inline constexpr int32_t formatCount = 78;  // including the spare row
 using FormatTable = std::array<FormatEntry, formatCount>;
 
-// The rows as the families of codecs export them, in the order of formats/families.def. They live
-// as long as the program.
+// The rows exported by the codec families, in the
+// order of formats/families.def. They are static.
 std::vector<std::span<const FormatEntry>> FormatFamilies();
 
-// All rows in the order of the registry: those of the families, and between them the formats that
-// no codec knows.
+// All rows in registry order: those of the
+// families, and the formats without a codec.
 FormatTable MakeFormatTable();
 
-// The row that waits for a plug-in's format.
+// The placeholder row for a plug-in format.
 constexpr FormatEntry SpareRow() {
   return {.flags = FMT_SPARE, .whyNot = TrLater("No plug-in uses this row.")};
 }

@@ -11,8 +11,8 @@ namespace fotomill {
 
 namespace {
 
-// The row of a format by its extension as it is in the table, not as names match; else the
-// plug-in's, which is bound.
+// The row with exactly this extension, not a prefix match; else the plug-in's row, which
+// is then bound.
 int32_t RowOf(std::string_view extension) {
   for (int32_t i = 0; i < kSpareRow; ++i) {
     if (FormatRow(i).extension.view() == extension) return i;
@@ -30,14 +30,14 @@ bool IsExcepted(std::string_view fileName, std::string_view exceptions) {
   return false;
 }
 
-// Whether a status may mean that the file is of another format.
+// Whether a status may mean that the file is in another format.
 bool IsRefusal(Status status) {
   return status != Status::Ok && status != Status::FileOpenError &&
          status != Status::MemoryAllocationError && status != Status::FunctionCancelled;
 }
 
-// Opens a file by the row of its name or, when that refuses, by one that its contents fit. `open`
-// is given a row's index and has the file only if it returns Ok.
+// Opens a file with the row of its name or, if that fails, with one that matches its contents.
+// `open` receives a row's index and succeeds by returning Ok.
 template <class Open>
 Status OpenByNameOrContents(const ReadRequest& request, const Open& open) {
   const int32_t named = FindFormatByName(request.fileName);
@@ -83,7 +83,7 @@ Status LoadPictureInfo(const ReadRequest& request, PicturePointer& picture) {
 bool OpenedByContents(const PictureRecord& picture) {
   if (picture.formatIndex != kSpareRow)
     return picture.formatIndex != FindFormatByName(picture.fileName);
-  // A look at the name might bind the spare row to another plug-in.
+  // A lookup by name could bind the spare row to another plug-in.
   return !EqualIgnoringCase(FormatRow(kSpareRow).extension,
                             platform::ExtensionOf(picture.fileName));
 }

@@ -11,7 +11,7 @@ namespace fotomill {
 
 namespace {
 
-// Built at the first call; the rows' switches and option boxes change later.
+// Built at the first call; only the rows' switches and options change later.
 FormatTable& Table() {
   static FormatTable table = MakeFormatTable();
   return table;
@@ -21,8 +21,8 @@ constinit thread_local FormatEntry spareRow = SpareRow();
 const PluginSource* pluginSource = nullptr;
 std::atomic<bool> pluginsOverride = false;
 
-// A row matches an extension that equals its own, or that shares its first three characters; a
-// shorter one must match to its end.
+// A row matches an extension equal to its own, or one with the same first three characters; a row
+// extension shorter than that must match completely.
 bool RowMatches(std::string_view rowExtension, std::string_view extension) {
   return EqualIgnoringCase(extension, rowExtension) ||
          EqualIgnoringCase(extension.substr(0, 3), rowExtension.substr(0, 3));

@@ -12,32 +12,32 @@
 
 namespace fotomill {
 
-// Row `index` of the registry; the rows live as long as the program. Only `enabled`, `options` and
-// the spare row change. Every thread has a spare row of its own, so that files of different plug-in
-// formats can be in work at once.
+// Row `index` of the registry; rows are static. Only `enabled`, `options` and the spare row
+// change. The spare row is thread-local, so that files of different plug-in formats can be
+// processed in parallel.
 FormatEntry& FormatRow(int32_t index);
-// The built-in state of a row's switch `enabled`.
+// The default of a row's `enabled` switch.
 int32_t EnabledByDefault(int32_t index);
 
-// The row that a file name selects by its extension, or kNoFormat. The first row wins whose
-// extension equals the name's, or whose first three characters equal the first three of the name's,
-// ignoring case; spare rows are skipped, as are disabled ones where plug-ins override them. Where
-// no row matches, the plug-ins are asked.
+// The row for a file name's extension, or kNoFormat. The first row wins
+// whose extension equals the name's or shares its first three characters,
+// ignoring case; spare rows are skipped, as are disabled ones if plug-ins
+// override them. If no row matches, plug-ins are searched.
 int32_t FindFormatByName(std::string_view fileName, int32_t parameter = 0);
-// `AllowPluginFormatOverride`: rows that are switched off leave their extensions to the plug-ins.
-// At first they do not.
+// `AllowPluginFormatOverride`: plug-ins may handle
+// the extensions of disabled rows. Off by default.
 void LetPluginsOverrideFormats(bool on);
 
-// What the registry asks the plug-in loader for. Without one no plug-in format exists.
+// Facts of a plug-in format. Without a plug-in source there are none.
 struct PluginFormatFacts {
-  std::string extension;  // upper case, without the dot
+  std::string extension;  // uppercase, without the dot
   std::string textB;      // the module's description of its formats
-  uint32_t maxBits = 0;   // deepest picture that it writes
+  uint32_t maxBits = 0;   // maximum bits per pixel it can write
   bool canWrite = false;
 };
-// The loader's answers; installed once.
+// The plug-in loader's callbacks; installed once.
 struct PluginSource {
-  // Binds the format of a file's extension to this thread's spare row; its index, or kNoFormat.
+  // Binds the plug-in format for a file's extension to this thread's spare row: index or kNoFormat.
   int32_t (*bind)(std::string_view fileName, int32_t parameter);
   // The formats of all modules, sorted.
   std::vector<PluginFormatFacts> (*list)();
@@ -45,60 +45,60 @@ struct PluginSource {
 void InstallPluginSource(const PluginSource* source);  // not owned; null removes it
 // The plug-in fallback of FindFormatByName.
 int32_t FindPluginFormat(std::string_view fileName, int32_t parameter = 0);
-std::vector<PluginFormatFacts> PluginFormats();  // of the installed source; empty without one
-// How lists show a plug-in format: "(EXT) Plugin", followed by a blank and the module's text when
-// it has one.
+std::vector<PluginFormatFacts> PluginFormats();  // from the installed source; empty without one
+// A plug-in format's name in lists: "(EXT) Plugin", followed by a blank and the module's text if it
+// has one.
 std::string PluginDescription(const PluginFormatFacts& format);
 
-// Whether pictures of a row can be read and written on this machine.
+// Whether a row's format can be read and written on this machine.
 bool CanRead(const FormatEntry& row);
-bool CanWrite(const FormatEntry& row);  // a library that is missing here counts
-// Why a row cannot be read or cannot be written here, in one sentence; empty when both work.
+bool CanWrite(const FormatEntry& row);  // false if a required library is missing
+// Why a row cannot be read or written here, in one sentence; empty if both work.
 std::string_view WhyNot(const FormatEntry& row);
 
-// What the codecs of all families have to be set and are built with, in the order of
-// formats/families.def, each once.
+// The settings and libraries of all codec families, in the order of
+// formats/families.def, without duplicates.
 std::vector<const FormatSettings*> SettingsOfFormats();
-std::vector<FormatLibrary> LibrariesOfFormats();  // each once
+std::vector<FormatLibrary> LibrariesOfFormats();  // without duplicates
 
-// Call `startup`, or `shutdown`, of every row that has one, in row order.
+// Calls `startup`, or `shutdown`, of every row that has one, in row order.
 void RunFormatStartup();
 void RunFormatShutdown();  // after the last picture
 
-// Opens and decodes what is asked for into a new record: finds its row, runs `info` and, for rows
-// that are not rendered, `read`. UnsupportedFormat (8) when no row matches, else the codec's own
-// status; `picture` is null unless Ok. A file that the row of its name refuses is opened by the row
-// that its contents fit, as far as the request's IdentifyOptions let it; the record's `formatIndex`
-// is that row then. Where this fails too, the status is that of the row of the name.
+// Opens and decodes a file into a new record: finds its row, runs `info` and, for rows that are not
+// rendered, `read`. UnsupportedFormat (8) if no row matches, else the codec's status; `picture` is
+// null unless Ok. If the row of the name rejects the file, it is opened with the row that matches
+// its contents, if the request's IdentifyOptions allow it; the record's `formatIndex` is then that
+// row. If that fails too, the status is that of the named row.
 Status LoadPicture(const ReadRequest& request, PicturePointer& picture, void* window = nullptr);
-// The first half of it: a record with the facts of a file. FileOpenError (1) for a path over 260
-// characters.
+// The first step of LoadPicture: a record with the header facts of a file. FileOpenError (1) for a
+// path over 260 characters.
 Status LoadPictureInfo(const ReadRequest& request, PicturePointer& picture);
-// Whether the record of a file has facts that a row of another format than its name's gave.
+// Whether a file was opened with a row other than that of its name.
 bool OpenedByContents(const PictureRecord& picture);
-// The second half: decodes a page of the file that the record has the facts of. NoImages (20) when
-// the file has no such page, else the codec's own status; `image` and `alpha` are empty unless Ok.
+// The second step: decodes a page of the file described by the record. NoImages (20) if the file
+// has no such page, else the codec's status; `image` and `alpha` are empty unless Ok.
 Status ReadPicture(const ReadRequest& request, PictureRecord& picture);
 
-// Opens the frames of a file, to be gone through in order; a still picture of such a format has
-// one. UnsupportedFunction (5) for formats without, else the codec's own status; `animation` is
-// null unless Ok.
+// Opens the frames of a file for sequential reading; a still picture of an animation format has one
+// frame. UnsupportedFunction (5) for other formats, else the codec's status; `animation` is null
+// unless Ok.
 Status OpenAnimation(const ReadRequest& request, AnimationPointer& animation);
 
-// Writes a picture to `destination` in the format of its extension. UnsupportedFormat (8) when no
-// row matches, TooManyColors (12) when the picture is deeper than the row takes,
-// UnsupportedFunction (5) when the row cannot write, EmptyImage (31) for a record without a
-// picture, InvalidDestination (29) for a path over 260 characters, UnsuitableImage (13) when the
-// row's files cannot be that large or that small, else the codec's own status.
-// Alpha that the format cannot hold is flattened first. The picture stays the caller's.
+// Writes a picture to `destination` in the format of its extension. UnsupportedFormat (8) if no
+// row matches, TooManyColors (12) if the picture is deeper than the row allows,
+// UnsupportedFunction (5) if the row cannot write, EmptyImage (31) for a record without a picture,
+// InvalidDestination (29) for a path over 260 characters, UnsuitableImage (13) if the format does
+// not allow that size, else the codec's status. Alpha that the format cannot store is flattened
+// first. The caller keeps the picture.
 Status WritePicture(PictureRecord& picture, std::string_view destination,
                     const WriteOptions& options);
-// The same to a given row.
+// As WritePicture, with a given row.
 Status WritePictureAs(PictureRecord& picture, std::string_view destination, int32_t formatIndex,
                       const WriteOptions& options);
 
-// The type name of a file for a browser's column, such as "(BMP) Windows bitmap", or "(XYZ) XYZ
-// file".
+// The file type for a browser's column, such as
+// "(BMP) Windows bitmap" or "(XYZ) XYZ file".
 std::string DescribeFileType(std::string_view fileName);
 
 // Description and patterns ("*.BMP;*.DIB") of one line of the open-file filter.
@@ -106,17 +106,17 @@ struct FilterPair {
   std::string description;
   std::string patterns;
 };
-// All pictures first, then one pair per row that can be opened, in row order, then the plug-in
-// formats.
+// All pictures first, then one pair per readable
+// row, in row order, then the plug-in formats.
 std::vector<FilterPair> OpenFileFilter();
-// Rows in which pictures can be saved, as offered to the user, in row order: indices.
+// Indices of the rows offered for saving, in row order.
 std::vector<int32_t> DestinationRows();
-// The same as the user sees them: extensions in lower case, followed by those of plug-in formats
-// that can be written.
+// As DestinationRows, as lowercase extensions,
+// followed by those of writable plug-in formats.
 std::vector<std::string> DestinationExtensions();
-// The rows of the format list, in which the user switches formats on and off: indices.
+// Indices of the rows in the format list, where the user switches formats on and off.
 std::vector<int32_t> FormatListRows();
-// The rows of other lists to choose a format from, shown by their descriptions: those switched on.
+// Indices of the enabled rows, for other lists of formats, shown by their descriptions.
 std::vector<int32_t> ChoiceRows();
 // A line of the format list: a multiplication sign (U+00D7) or a blank, a tab, the description.
 std::string FormatListLine(int32_t index);

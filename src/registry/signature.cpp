@@ -12,15 +12,14 @@ namespace {
 
 using namespace std::string_view_literals;
 
-// A signature and the extension of the row that means such files, or under which a plug-in may;
-// none for files that are not pictures.
+// A signature and the extensions of the rows or plug-ins for such files; none for files that are
+// not pictures.
 struct SignatureOfRow {
   std::string_view extension;
   Signature signature;
 };
 
-// Signatures of formats that have no codec, and of files that people take for pictures of a format
-// of ours.
+// Signatures of formats without a codec, and of files often mistaken for pictures.
 // clang-format off
 constexpr SignatureOfRow kWithoutCodec[] = {
     {"AVI",  {0, "RIFF"sv, "AVI", 8, "AVI "sv}},
@@ -118,8 +117,8 @@ size_t Length(const Signature& signature) {
   return signature.bytes.size() + signature.second.size();
 }
 
-// Long signatures before those of a few bytes, which other files may begin with by chance; of equal
-// ones first the format that gives the name.
+// Long signatures first, as short ones may match by chance; among equal ones, the format that
+// provides the name comes first.
 std::vector<SignatureOfRow> AllSignatures() {
   std::vector<SignatureOfRow> all;
   for (const std::span<const FormatEntry> family : FormatFamilies()) {
@@ -179,7 +178,7 @@ FileKind KindBehindName(const std::string& fileName, int32_t formatIndex) {
   FileKind kind = IdentifyFile(fileName);
   if (formatIndex == kNoFormat) return kind;
   const FormatEntry& row = FormatRow(formatIndex);
-  // Targa files have no signature, and the first bytes of many are those of an icon or a cursor.
+  // Targa files have no signature, and many start with the same bytes as an icon or a cursor.
   const bool chance = row.signatures.empty() && (kind.IsOf("CUR") || kind.IsOf("ICO"));
   return chance || kind.IsOf(row.extension) ? FileKind() : kind;
 }

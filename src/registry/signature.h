@@ -9,26 +9,26 @@
 
 namespace fotomill {
 
-// What a file's first bytes say that it is, whatever its name.
+// A file's format according to its first bytes, whatever its name.
 struct FileKind {
-  // as people call the format: "AVIF"; empty when nothing fits
+  // common name of the format: "AVIF"; empty if unknown
   std::string_view name;
-  // of the registry's rows and of plug-ins that mean such files, the likeliest first
+  // of the registry rows and plug-ins that read such files, most likely first
   std::vector<std::string_view> extensions;
   bool IsOf(std::string_view extension) const;
 };
 
-// So many bytes from the start of a file decide: the first 32, and as many behind the 512 that
-// precede a Macintosh picture.
+// Bytes from the start of a file that are needed: the first 32, and 32 after the 512-byte header of
+// a Macintosh picture.
 inline constexpr size_t kSignatureBytes = 512 + 32;
 
-// Recognises a file by its first kSignatureBytes bytes (fewer when it is shorter), by the longest
-// signature that fits.
+// Identifies a file by its first kSignatureBytes bytes (fewer if it is shorter), by the longest
+// matching signature.
 FileKind IdentifySignature(std::span<const uint8_t> head);
-// The same for a file; nothing fits when it cannot be opened.
+// As above, for a file; empty if it cannot be opened.
 FileKind IdentifyFile(const std::string& fileName);
-// What a file really is, if its name selects the wrong row `formatIndex` (kNoFormat: none). Nothing
-// if the contents match the name, or give no clue.
+// The actual format of a file whose name selects the wrong row `formatIndex` (kNoFormat: none).
+// Empty if the contents match the name or cannot be identified.
 FileKind KindBehindName(const std::string& fileName, int32_t formatIndex);
 
 }  // namespace fotomill

@@ -19,9 +19,9 @@ constexpr std::string_view kBlockHeader = ";\r\n;\r\n;------ INI FILE ------\r\n
 
 struct Configuration {
   ConfigurationState state = ConfigurationState::NotLoaded;
-  std::string text;  // of the file as this run knows it: as loaded, with this run's own changes
+  std::string text;  // of the file as known to this run: as loaded, plus this run's changes
   std::vector<ValueComplaint> complaints;
-  std::bitset<kKeyCount> forThisRun;  // keys whose value came from SetSetting
+  std::bitset<kKeyCount> forThisRun;  // keys set by SetSetting
 };
 
 Configuration& TheConfiguration() {
@@ -29,11 +29,11 @@ Configuration& TheConfiguration() {
   return configuration;
 }
 
-// Calls take(row, entry) for the first line of every known key.
+// Calls take(row, entry) for the first entry of every known key.
 template <typename Take>
 void ForEachKey(std::string_view text, Take take) {
   std::bitset<kKeyCount> seen;
-  size_t next = 0;  // files are mostly written in table order
+  size_t next = 0;  // files are mostly in table order
   IniReader reader(text, kConfigurationSection);
   for (IniEntry entry; reader.Next(entry);) {
     const KeyRow* const row = FindKey(entry.key, next);
@@ -69,7 +69,7 @@ ConfigurationState ReadConfigurationText(std::string& text) {
   return ConfigurationState::Unreadable;
 }
 
-// Makes the changes in the file, and in what this run knows of it.
+// Applies the edits to the file and to this run's copy of its text.
 SaveResult WriteEdits(std::span<const IniEdit> edits,
                       std::string_view section = kConfigurationSection) {
   Configuration& configuration = TheConfiguration();
@@ -87,7 +87,7 @@ SaveResult WriteEdits(std::span<const IniEdit> edits,
   return result == EditResult::Done ? SaveResult::Done : SaveResult::Unchanged;
 }
 
-// Which keys hold the value that the file as this run knows it gives them.
+// Keys whose value equals that in this run's copy of the file.
 std::bitset<kKeyCount> UnchangedKeys(const Configuration& configuration) {
   std::bitset<kKeyCount> unchanged;
   for (const KeyRow& row : Keys())
@@ -147,7 +147,7 @@ SaveResult SaveConfiguration() {
   const std::bitset<kKeyCount> unchanged = UnchangedKeys(TheConfiguration());
   std::vector<std::string> values;
   std::vector<IniEdit> edits;
-  values.reserve(kKeyCount);  // the edits look into it
+  values.reserve(kKeyCount);  // no reallocation: the edits point into it
   for (const KeyRow& row : Keys()) {
     if (unchanged[NumberOfKey(row)]) continue;
     edits.push_back({row.name, values.emplace_back(ValueText(row))});
@@ -206,7 +206,7 @@ std::optional<std::string> LoadConfigurationBlock() {
       platform::ReadWholeFile(path, limits.listFileBytes, contents) != platform::ReadResult::Done) {
     return std::nullopt;
   }
-  // it changed while it was read
+  // it changed while being read
   if (contents.size() != platform::FactsOf(path).size) return std::nullopt;
   return std::string(kBlockHeader) + contents;
 }

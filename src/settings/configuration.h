@@ -15,25 +15,25 @@ namespace fotomill {
 
 // The configuration file "Fotomill Professional 11.ini" in the data folder: its section "Fotomill"
 // holds one line "KEY=VALUE" for each key that differs from its default. Numbers, flags, colors and
-// choices are decimal, texts stand as they are. All of this belongs to the main thread.
+// choices are decimal, texts are stored verbatim. For the main thread only.
 
-// The file's name in the data folder, and the section that holds the keys.
+// The file's name in the data folder, and the section with the keys.
 inline constexpr std::string_view kConfigurationFile = "Fotomill Professional 11.ini";
 inline constexpr std::string_view kConfigurationSection = "Fotomill";  // of the INI file
 
-// Path of the configuration file, whether it is there or not; empty without a data folder.
+// Path of the configuration file, which may not exist; empty without a data folder.
 std::string ConfigurationPath();
 
-// What became of loading the configuration file.
+// Result of loading the configuration file.
 enum class ConfigurationState {
   NotLoaded,
-  Missing,  // the defaults stand
+  Missing,  // the defaults apply
   Loaded,
-  Unreadable,  // it is there and cannot be read, is longer than 16 MiB or not a text of bytes: the
-               // defaults stand, and nothing is written in this run
+  Unreadable,  // it exists but cannot be read, is over 16 MiB or not 8-bit text: the defaults
+               // apply, and this run writes nothing
 };
 
-// A line of the configuration file whose value was ignored or changed.
+// A line of the configuration file with an invalid value, ignored or adjusted.
 struct ValueComplaint {
   const KeyRow* row;
   ValueFault fault;
@@ -41,68 +41,68 @@ struct ValueComplaint {
   std::string value;  // its first 260 bytes
 };
 
-// Gives every key its default and then what the configuration file holds. Values given by
-// SetSetting before are gone.
+// Resets every key to its default, then applies the configuration file. Values from
+// SetSetting are discarded.
 ConfigurationState LoadConfiguration();
-// What the last load found.
+// The result of the last load.
 ConfigurationState StateOfConfiguration();
-std::span<const ValueComplaint> ConfigurationComplaints();  // of the last loading
+std::span<const ValueComplaint> ConfigurationComplaints();  // from the last load
 
-// What became of a value given by name.
+// Result of setting a key by name.
 struct SetResult {
   enum Code { Done, UnknownKey, WrongValue } code = Done;
-  // in the user's language, a whole sentence; for an unknown key it names the nearest one
+  // in the user's language, a whole sentence; for an unknown key it suggests the nearest one
   std::string message;
 
-  // Whether there was nothing to complain of.
+  // Whether the value was accepted without complaint.
   bool Ok() const { return code == Done; }
 };
 
-// Gives a key a value for this run: it wins over the configuration file and is not written there by
-// a later save.
+// Sets a key for this run: it overrides the
+// configuration file and is not saved.
 SetResult SetSetting(std::string_view key, std::string_view value);
 
-// What became of writing to the configuration file.
+// Result of writing the configuration file.
 enum class SaveResult {
   Done,
   Unchanged,   // there was nothing to write
-  NoFolder,    // the system has no place for it
-  Unreadable,  // what is there cannot be read and is left alone
-  Failed,      // not written; the old file stays
+  NoFolder,    // no data folder
+  Unreadable,  // the existing file cannot be read; left unchanged
+  Failed,      // not written; the old file is unchanged
 };
 std::string_view SaveMessage(SaveResult result);  // a whole sentence in English, empty for success
 
-// Writes the keys that this run has changed since the load, and only those: what other processes
-// wrote meanwhile, unknown keys, comments and other sections stay. The file is replaced in one
-// step.
+// Writes only the keys that this run has changed since loading;
+// concurrent changes by other processes, unknown keys, comments
+// and other sections are kept. The file is replaced atomically.
 SaveResult SaveConfiguration();
-// Gives a key a value permanently: takes it up and writes it, whatever --set said. `result` tells
-// what is wrong with the value; then nothing is written, and the key keeps its value if writing
-// fails.
+// Sets a key permanently, overriding --set, and writes
+// it. If `result` has a fault, nothing is written; if
+// writing fails, the key keeps its old value.
 SaveResult StoreSetting(const KeyRow& row, const SettingValue& value);
-// Takes a key out of the configuration file and gives it its default.
+// Removes a key from the configuration file and resets it to its default.
 SaveResult RemoveSetting(const KeyRow& row);
-// Whether a key has its value from SetSetting.
+// Whether a key's value comes from SetSetting.
 bool IsForThisRun(const KeyRow& row);
-// The configuration file's text as this run knows it: as loaded, with this run's own changes. Valid
-// until the next one.
+// The configuration file's text as known to this run: as loaded, plus this run's changes. Valid
+// until the next change.
 std::string_view ConfigurationText();
-// Makes changes to another section of the configuration file.
+// Edits another section of the configuration file.
 SaveResult StoreInSection(std::string_view section, std::span<const IniEdit> edits);
-// From here on a value given by SetSetting counts like one that the user chose in a dialog, and is
-// saved.
+// Makes a value from SetSetting permanent, as if the user had chosen it in a dialog: it
+// will be saved.
 void KeepSetting(const KeyRow& row);
 
-// The keys that are needed before anything else is set up, read straight from the configuration
-// file.
+// Keys that are needed before the rest of the configuration, read directly from
+// the configuration file.
 struct EarlySettings {
   int32_t showStartupWindow, logoDelay, normalTextFontSize, smallTextFontSize, normalThumbFontSize;
 };
-// Defaults where the file cannot be read or does not name a key. Changes no setting.
+// Defaults if the file cannot be read or a key is missing. Changes no setting.
 EarlySettings ReadEarlySettings();
 
-// The configuration file as one block for showing it or passing it on: a comment header, then the
-// file's bytes. nullopt when it cannot be read whole.
+// The configuration file for display or support requests: a comment header, then the file's bytes.
+// nullopt if it cannot be read completely.
 std::optional<std::string> LoadConfigurationBlock();
 
 }  // namespace fotomill

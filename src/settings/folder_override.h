@@ -6,7 +6,7 @@
 
 namespace fotomill {
 
-// How a browser shows a folder; the numbers are those of choice_lists.h.
+// How a browser shows a folder, as values of choice_lists.h.
 struct BrowserModes {
   int32_t thumbnails = 0;  // choice::ThumbnailMode
   int32_t view = 0;        // choice::ViewMode
@@ -15,13 +15,13 @@ struct BrowserModes {
   bool operator==(const BrowserModes&) const = default;
 };
 
-// The modes that a browser takes when it comes to a folder: those that the folder's file
-// "fmwpro.override" sets, and `current` where it sets none, cannot be read, or UseFolderOverrides
-// is off.
+// The modes for a folder: those set in its file
+// "fmwpro.override", and `current` for those it does not set,
+// if it cannot be read, or if UseFolderOverrides is off.
 BrowserModes ModesForFolder(const std::string& folder, const BrowserModes& current);
 
-// The same for the text of such a file: the keys ThumbnailMode, ViewMode and SortMode of the
-// section "Fotomill". A value that is no number, or an unknown mode, sets nothing.
+// As above, from the text of such a file: the keys ThumbnailMode, ViewMode and SortMode of the
+// section "Fotomill". Invalid or unknown values are ignored.
 BrowserModes ModesInOverride(std::string_view text, const BrowserModes& current);
 
 }  // namespace fotomill

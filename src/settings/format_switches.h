@@ -7,18 +7,18 @@
 
 namespace fotomill {
 
-// The user's switches of the format rows between runs: the section "Formats" of the configuration
-// file holds a line "EXTENSION=0" or "EXTENSION=1" for each row whose switch is not as the program
-// has it by default.
+// The user's format switches, stored in the section "Formats" of
+// the configuration file: a line "EXTENSION=0" or "EXTENSION=1"
+// for each row whose switch differs from its default.
 inline constexpr std::string_view kFormatSection = "Formats";
 
-// Gives every row the switch that the loaded configuration says, or its default, and takes the
-// plug-ins' override. Lines that name no row mean nothing.
+// Sets every row's switch from the loaded configuration, or to its default, and applies the plug-in
+// override. Lines for unknown rows are ignored.
 void TakeFormatSwitches();
-// The part of it that is a key: tells the registry of AllowPluginFormatOverride. To be called when
-// the settings have changed.
+// Passes AllowPluginFormatOverride to the registry.
+// To be called when the settings have changed.
 void TakePluginOverride();
-// Switches a row on or off and saves that. The switch is turned even if saving fails.
+// Switches a row on or off and saves that. The switch changes even if saving fails.
 SaveResult SwitchFormat(int32_t index, bool on);
 
 }  // namespace fotomill

@@ -17,7 +17,7 @@ namespace fotomill {
 
 namespace {
 
-constexpr int32_t kMostEntries = 1000;  // whatever a key says
+constexpr int32_t kMostEntries = 1000;  // upper limit for all keys
 
 struct ListFile {
   const char* name;
@@ -50,7 +50,7 @@ std::string_view TakeLine(std::string_view& text) {
   return line;
 }
 
-// Collects what `parse` makes of the lines; each entry counts once, and the first of equals.
+// Collects the parsed lines without duplicates; the first one wins.
 template <typename Entry, typename Parse, typename Same>
 std::vector<Entry> ParseLines(std::string_view text, size_t most, Parse parse, Same same) {
   std::vector<Entry> entries;
@@ -101,7 +101,7 @@ bool EditList(const ListFile& file, const std::function<void(std::string&)>& edi
   return result == EditResult::Done || result == EditResult::Unchanged;
 }
 
-// The entries with a new first one, no longer than `most`.
+// The entries with a new one first, at most `most`.
 template <typename Entry, typename Same>
 void PutFirst(std::vector<Entry>& entries, const Entry& entry, size_t most, Same same) {
   std::erase_if(entries, [&](const Entry& other) { return same(other, entry); });

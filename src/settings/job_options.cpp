@@ -18,7 +18,7 @@ namespace fotomill {
 
 namespace {
 
-constexpr int32_t kWhole = 100;  // per cent
+constexpr int32_t kWhole = 100;  // percent
 constexpr int32_t kFewestGrays = 2, kMostGrays = 256;
 
 Dither DitherFromKey(int32_t value) {

@@ -14,32 +14,32 @@ struct FaceOptions;
 struct ThumbnailOptions;
 struct ThumbnailUpdateOptions;
 
-// What a job needs of the settings in force, as the small structs that its subjects define. Filled
-// once, where a job begins, on the thread that the settings belong to; the job then runs with its
-// own copy, whatever is changed meanwhile.
+// Copies of the current settings for jobs, as small structs defined
+// by their subjects. Taken once when a job starts, on the thread
+// that owns the settings; later changes do not affect the job.
 
-// What codecs depend on, by the keys that the structs name. A new key of a codec is one field there
-// and one line here.
+// The settings of codecs, by the keys named in the structs. A new codec key is one field there and
+// one line here.
 ReadOptions ReadOptionsFromSettings();
-EncodeOptions EncodeOptionsFromSettings();  // the keys that EncodeOptions names
+EncodeOptions EncodeOptionsFromSettings();  // the keys named in EncodeOptions
 
-// FXColorDither and FXMonoDither (other numbers than those of the lists as the last one),
-// FXBidirectional, FXMonomode, FXGrayLevel, FXThreshold, DitherBrightness and DitherContrast, each
-// clamped to its range.
+// FXColorDither and FXMonoDither (out-of-range values become the last entry),
+// FXBidirectional, FXMonomode, FXGrayLevel, FXThreshold, DitherBrightness and DitherContrast,
+// each clamped to its range.
 ReduceOptions ReduceOptionsFromSettings();
 
 // ExifShowTypes.
 ExifTextOptions ExifTextOptionsFromSettings();
 // ExifDistinceUnits.
 choice::DistanceUnit DistanceUnitFromSettings();
-// ExifDefaultLocation. False, with `location` at zero, when it holds no location.
+// ExifDefaultLocation. False, with `location` zero, if it is not set.
 [[nodiscard]] bool GpsLocationFromSettings(GpsLocation& location);
 
-HistoryOptions HistoryOptionsFromSettings();  // the keys that HistoryOptions names
+HistoryOptions HistoryOptionsFromSettings();  // the keys named in HistoryOptions
 FaceOptions FaceOptionsFromSettings();
-ThumbnailOptions ThumbnailOptionsFromSettings();  // the keys that ThumbnailOptions names
-ThumbnailUpdateOptions ThumbnailUpdateOptionsFromSettings();  // the keys that it names
-// Takes up what the user chose in the offer to update thumbnails.
+ThumbnailOptions ThumbnailOptionsFromSettings();  // the keys named in ThumbnailOptions
+ThumbnailUpdateOptions ThumbnailUpdateOptionsFromSettings();  // the keys named there
+// Stores the user's choice about updating thumbnails.
 void StoreThumbnailUpdate(const ThumbnailUpdateOptions& options);
 
 // WriteFileComments.

@@ -6,7 +6,7 @@ namespace fotomill {
 
 namespace {
 
-// The lines below a key's heading.
+// The text below a key's heading.
 std::string_view EntryOf(const KeyRow& row) {
   const std::string heading = std::string("\n### ") + row.name + "\n";
   const size_t start = kSettingsPage.find(heading);

@@ -7,19 +7,19 @@
 
 namespace fotomill {
 
-// What keys do, from docs/user/settings.md, in English. That page has an entry for every key that
-// this build reads and for no other.
+// Help for keys, from docs/user/settings.md, in English. That page documents exactly the keys that
+// this build uses.
 
-// The page itself.
+// The whole page.
 extern const std::string_view kSettingsPage;
 
-// What the key does, as one paragraph of plain text; empty for a key that this build does not use.
+// A key's description as one paragraph of plain text; empty for a key that this build does not use.
 std::string KeyHelp(const KeyRow& row);
-// The first sentence of it.
+// The first sentence of KeyHelp.
 std::string KeySummary(const KeyRow& row);
-// Whether anything reads the key.
+// Whether this build uses the key.
 bool IsKeyUsed(const KeyRow& row);
-// What to tell who sets a key that nothing reads, in the user's language.
+// The warning for setting an unused key, in the user's language.
 std::string UnusedKeyText(const KeyRow& row);
 
 }  // namespace fotomill

@@ -67,7 +67,7 @@ constexpr size_t kLimits[] = {
 #undef SETTING
 };
 
-// Length and last letter of a name: what a search looks at before it compares names.
+// Length and last letter of a name, compared before the names themselves.
 constexpr uint16_t TagOf(std::string_view name) {
   return static_cast<uint16_t>((name.size() << 8) |
                                (name.empty() ? 0 : static_cast<unsigned char>(name.back())));
@@ -85,7 +85,7 @@ constexpr void* VariableOf(FixedText<capacity>& text) {
 }
 constexpr void* VariableOf(int32_t& number) { return &number; }
 
-// A choice has a list, a limited text its limit, no other row an extra word.
+// Choices have a list, limited texts a limit, other rows nothing.
 constexpr bool ExtraFits(Kind kind, const void*) {
   return kind == Kind::Choice || kind == Kind::ValueChoice;
 }
@@ -107,11 +107,11 @@ consteval bool ControlsAreUnique() {
   for (size_t i = 1; i < kKeyCount; ++i) {
     if (controls[i] != 0 && controls[i] == controls[i - 1]) return false;
   }
-  return controls.back() < 10000;  // ranges of spin controls begin there
+  return controls.back() < 10000;  // 10000 and up are for the ranges of spin controls
 }
 static_assert(ControlsAreUnique());
 
-// The variable's twin among the defaults.
+// The matching variable in the defaults.
 const void* DefaultOf(const KeyRow& row) {
   const char* const first = static_cast<const char*>(static_cast<const void*>(&settings));
   const char* const variable = static_cast<const char*>(row.variable);

@@ -5,8 +5,8 @@
 
 namespace fotomill {
 
-// The value of a key in force, as the configuration file holds it; empty for a key that does not
-// exist. What operations take the defaults of their parameters from.
+// A key's current value, in configuration file syntax; empty for unknown keys. Source of the
+// default parameters of operations.
 std::string KeyTextInForce(std::string_view key);
 
 }  // namespace fotomill

@@ -15,7 +15,7 @@ namespace fotomill {
 
 namespace {
 
-// The key table as modules see it. Its rows have that very layout.
+// The key table as seen by modules. The row layouts are identical.
 const FMW_CONFIG_ENTRY* ConfigurationTable() {
   static_assert(sizeof(FMW_CONFIG_ENTRY) == sizeof(KeyRow) &&
                 offsetof(FMW_CONFIG_ENTRY, type) == offsetof(KeyRow, type) &&

@@ -8,18 +8,18 @@
 
 namespace fotomill {
 
-// What plug-ins get of the settings: the key table, whose values modules may read and change, and
-// the user's switches. The configuration file's section "Plugins" holds a line "NAME=0" for each
-// module that is switched off. All of this belongs to the main thread, like the configuration.
+// Settings for plug-ins: the key table, which modules can access, and the user's module switches,
+// stored in the section "Plugins" of the configuration file: a line "NAME=0" for each module that
+// is off. For the main thread only, like the configuration.
 inline constexpr std::string_view kPluginSection = "Plugins";
 
-// Hands the key table and the switches of the loaded configuration to the plug-in table.
+// Passes the key table and the loaded switches to the plug-in table.
 void ApplyPluginSettings();
-// Switches a module, by its file name, and saves that. What is loaded stays loaded until the next
-// scan.
+// Switches a module, by file name, on or off and saves that. Loaded modules stay loaded until the
+// next scan.
 SaveResult SwitchPluginModule(const std::string& name, bool on);
-// Calls the own settings dialog of a row of the plug-in table, and remembers the row in
-// PluginConfigIndex. False when the module offers none.
+// Opens the settings dialog of a plug-in table row, and stores the row in PluginConfigIndex. False
+// if the module has none.
 bool ConfigurePluginRow(int32_t index);
 
 }  // namespace fotomill

@@ -13,7 +13,7 @@ namespace fotomill {
 
 namespace {
 
-constexpr uint64_t kPiece = uint64_t{1} << 20;  // the thumbnail database may be larger than memory
+constexpr uint64_t kPiece = uint64_t{1} << 20;  // the thumbnail database may exceed the memory
 
 bool MatchesOne(std::string_view name, std::string_view pattern) {
   if (!pattern.starts_with('*')) return EqualIgnoringCase(name, pattern);

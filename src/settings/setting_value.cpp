@@ -19,7 +19,7 @@ namespace {
 
 constexpr int32_t kMostColor = 0xFFFFFF;
 
-// Decimal, or "0x" and hexadecimal digits where a person writes.
+// Decimal; from a person also "0x" and hex digits.
 std::optional<int32_t> ReadNumber(std::string_view value, ValueSource source) {
   if (source == ValueSource::Person && (value.starts_with("0x") || value.starts_with("0X"))) {
     value.remove_prefix(2);
@@ -33,7 +33,7 @@ std::optional<int32_t> ReadNumber(std::string_view value, ValueSource source) {
   return ParseNumber(value);
 }
 
-// "#RRGGBB", "#RGB" or a CSS name, as the stored number; not a color that shines through.
+// "#RRGGBB", "#RGB" or a CSS name, as the stored number; no transparent colors.
 std::optional<int32_t> ReadColorText(std::string_view text) {
   AlphaColor color;
   if (!ReadColor(text, color) || color.alpha != 255) return std::nullopt;
@@ -48,7 +48,7 @@ std::optional<int32_t> ReadFlagWord(std::string_view text) {
   return std::nullopt;
 }
 
-// What a key of that kind may be written as beside its number.
+// Alternative spellings of a value for this kind of key.
 std::optional<int32_t> ReadWord(const KeyRow& row, std::string_view text) {
   if ((row.type & KEY_COLOR) != 0) return ReadColorText(text);
   if ((row.type & KEY_FLAG) != 0 && !IsLooseFlag(row)) return ReadFlagWord(text);

@@ -9,54 +9,54 @@
 
 namespace fotomill {
 
-// What is wrong with a value.
+// Why a value is invalid.
 enum class ValueFault {
   None,
-  NotNumber,   // neither a whole number of 32 bits nor a word that the key takes
+  NotNumber,   // neither a 32-bit integer nor a word accepted by the key
   NotFlag,     // neither 0 nor 1
   NotColor,    // not a number of 24 bits
   NotChoice,   // not in the choice list
   OutOfRange,  // outside the key's limits
   TooLong,     // longer than the key's limit
-  NotText,     // holds a line break or a zero byte
-  NotName,     // part of a file name that leads elsewhere
-  Internal,    // the program's own value
+  NotText,     // contains a line break or NUL
+  NotName,     // part of a file name, but contains a path
+  Internal,    // set by the program only
 };
 
-// Where a value comes from. A person is told about every fault. A file is not: what can be used of
-// it is.
+// The source of a value. A person is told about every fault; a file's values are used as
+// far as possible.
 enum class ValueSource { Person, File };
 
-// A value that was read, and what is wrong with it.
+// A parsed value and its fault, if any.
 struct SettingValue {
   ValueFault fault = ValueFault::None;
-  bool usable = true;     // false: the key keeps the value that it has
+  bool usable = true;     // false: the key keeps its current value
   int32_t number = 0;     // keys without KEY_TEXT
-  std::string_view text;  // keys with it; a view into what was read
+  std::string_view text;  // keys with KEY_TEXT; a view into the input
 };
 
-// Reads a value as it is in the configuration file or on a command line, whole and with its blanks.
-// Numbers are decimal; a person may write 0x. A color may also be #RRGGBB, #RGB or a CSS name, a
-// flag yes, no, true, false, on or off. What a key does not take is not usable, with one exception:
-// a text with a limit that comes from a file is cut to it.
+// Parses a value from the configuration file or the command line; blanks are significant. Numbers
+// are decimal; a person may also write 0x. A color may be #RRGGBB, #RGB or a CSS name, a flag yes,
+// no, true, false, on or off. Invalid values are not usable, with one exception: a limited text
+// from a file is cut to its limit.
 SettingValue ReadValue(const KeyRow& row, std::string_view value, ValueSource source);
 
-// Stores a value that is usable.
+// Stores a usable value.
 void StoreValue(const KeyRow& row, const SettingValue& value);
-// Whether the key holds that value now.
+// Whether the key has that value now.
 bool HoldsValue(const KeyRow& row, const SettingValue& value);
 
-// The value in force, or the default, as the configuration file holds it.
+// The current value, or the default, in configuration file syntax.
 std::string ValueText(const KeyRow& row);
-std::string DefaultValueText(const KeyRow& row);  // as the file would say it
+std::string DefaultValueText(const KeyRow& row);  // in configuration file syntax
 
-// The same for people: a color as #RRGGBB.
+// As above, for display: a color as #RRGGBB.
 std::string ReadableValue(const KeyRow& row);
-std::string ReadableDefault(const KeyRow& row);  // likewise
+std::string ReadableDefault(const KeyRow& row);  // as above
 
-// What the key takes, for people: "a number from 0 to 9".
+// The valid values, for display: "a number from 0 to 9".
 RecordedText ValuesText(const KeyRow& row);
-// As a whole sentence: "PngCompression takes a number from 0 to 9." Empty without a fault.
+// As a sentence: "PngCompression takes a number from 0 to 9." Empty without a fault.
 std::string FaultMessage(const KeyRow& row, ValueFault fault);
 
 }  // namespace fotomill

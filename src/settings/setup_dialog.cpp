@@ -25,8 +25,8 @@ int32_t ValueAt(const KeyRow& row, int32_t position) {
   return (row.type & KEY_BY_VALUE) != 0 ? row.extra.choices[position].value : position;
 }
 
-// The place in the list that shows a number; one that is not in the list is shown as the default,
-// and a default that is not as the last entry.
+// The list position of a number; numbers that are not listed are shown as the default, or else as
+// the last entry.
 int32_t PositionOf(const KeyRow& row, int32_t number) {
   int32_t last = 0, byDefault = -1;
   for (; row.extra.choices[last].text != nullptr; ++last) {
@@ -57,7 +57,7 @@ void FillDestinations(SetupDialog& dialog, const DestinationSource& destinations
   dialog.Select(row.control, DestinationPosition(extensions, TextOf(row, values)));
 }
 
-// What the dialog itself says of a spin control's range counts.
+// The dialog's own range for a spin control takes precedence.
 SpinRange RangeIn(const SetupDialog& dialog, const KeyRow& row) {
   const uint32_t control = row.control + kSpinRangeControl;
   const auto range = dialog.Has(control) ? ParseSpinRange(dialog.Text(control)) : std::nullopt;
@@ -84,22 +84,22 @@ void FillControl(SetupDialog& dialog, const DestinationSource& destinations, con
   }
 }
 
-// What a control holds for its key.
+// The contents of a key's control.
 struct ControlValue {
   const KeyRow* row;
-  std::string text;   // the value as the configuration file would hold it
-  std::string fault;  // what the key takes instead
+  std::string text;   // the value in configuration file syntax
+  std::string fault;  // the valid values, if this is not one
 };
 
-// A check box says no more than off or on: a number that means on stays, and on again is what it is
-// by default.
+// A check box only knows off and on: a nonzero number is kept, and turning it on sets the default
+// if that is nonzero.
 int32_t FlagIn(const SetupDialog& dialog, const KeyRow& row) {
   const bool checked = dialog.IsChecked(row.control);
   if (checked == (NumberIn(row) != 0)) return NumberIn(row);
   return checked ? std::max(IsLooseFlag(row) ? DefaultNumber(row) : 1, 1) : 0;
 }
 
-// A choice that still shows what the key's number is shown as has not been touched.
+// A choice whose position is unchanged keeps its number.
 int32_t ChoiceIn(const SetupDialog& dialog, const KeyRow& row) {
   const int32_t position = dialog.Selected(row.control);
   return position < 0 || position == PositionOf(row, NumberIn(row)) ? NumberIn(row)

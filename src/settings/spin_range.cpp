@@ -27,7 +27,7 @@ constexpr KeyRange kRanges[] = {
     {KeyNumber::JpegCompression,               {0, 100,   1}},    // quality
     {KeyNumber::MaximumPreviewDimension,       {16, 65535, 16}},  // pixels
     {KeyNumber::MovieQualityFactor,            {0, 10000, 100}},
-    {KeyNumber::PngCompression,                {0, 9,     1}},    // level of deflate
+    {KeyNumber::PngCompression,                {0, 9,     1}},    // deflate level
     {KeyNumber::TiffResolution,                {1, 32767, 1}},    // dots per inch
     {KeyNumber::UndoLevels,                    {0, 1000,  1}},
     {KeyNumber::WebPQualityFactor,             {0, 100,   1}},

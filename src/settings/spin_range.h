@@ -9,22 +9,22 @@
 
 namespace fotomill {
 
-// What a spin control offers.
+// The range of a spin control.
 struct SpinRange {
   int32_t minimum = 0, maximum = 0, step = 1;
 };
 
-// The limits of a number; nullopt for a key that takes any.
+// The limits of a number; nullopt if the key has none.
 std::optional<SpinRange> LimitsOf(const KeyRow& row);
-// The range of a KEY_SPIN row. Setup dialogs put its text into the control numbered `control` +
-// kSpinRangeControl, from where the binding reads it, so that a dialog may offer less.
+// The range of a KEY_SPIN row. Setup dialogs put it as text into the control numbered `control` +
+// kSpinRangeControl, and it is read back from there, so that a dialog may narrow it.
 SpinRange SpinRangeOf(const KeyRow& row);
-// Added to a control's number: the text with its range.
+// Offset from a spin control's number to the control with its range text.
 inline constexpr uint32_t kSpinRangeControl = 10000;
 
-// "minimum,maximum,step" and back; nullopt when the text does not hold three numbers.
+// Formats and parses "minimum,maximum,step"; nullopt if the text is not three numbers.
 std::string SpinRangeText(const SpinRange& range);
-// Nullopt where the text is no range.
+// nullopt if the text is not a range.
 std::optional<SpinRange> ParseSpinRange(std::string_view text);
 
 }  // namespace fotomill
