@@ -16,7 +16,7 @@ except ImportError:
     print("python3-gi is not installed: left out")
     sys.exit(77)
 
-from driven_desktop import PATIENCE, Desktop, Failure, make_pictures, run
+from driven_desktop import BARE, PATIENCE, Desktop, Failure, make_pictures, run
 
 ACCESSIBLE = "org.a11y.atspi.Accessible"
 # Bits of the states of the accessibility interface.
@@ -241,4 +241,4 @@ def batch_windows_are_heard(folder):
         desktop.check("Progress")
 
 
-run(every_window_is_heard, batch_windows_are_heard)
+run(every_window_is_heard, batch_windows_are_heard, displays=[BARE])

@@ -72,8 +72,9 @@ def open_select_view(folder):
         make_pictures(pictures, ["c.bmp"])
         desktop.wait(r"lines=7 .*listing=0 .*focus=a2.png")
         # The tip of the file below the pointer.
-        desktop.xdotool("mousemove", 330, 280)
-        desktop.xdotool("mousemove", 335, 285)
+        window = desktop.focus("Fotomill Professional")
+        desktop.xdotool("mousemove", "--window", window, 330, 280)
+        desktop.xdotool("mousemove", "--window", window, 335, 285)
         desktop.wait(r"tip ")
         desktop.xdotool("mousemove", 5, 5)
         desktop.key("ctrl+f")

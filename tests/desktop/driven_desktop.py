@@ -12,11 +12,23 @@ import subprocess
 import sys
 import tempfile
 import time
+import traceback
 import zlib
 from pathlib import Path
 
 PROJECT = Path(__file__).resolve().parents[2]
+BARE, OPENBOX = "bare", "openbox"  # displays without and with a window manager
 PATIENCE = 60  # seconds until a test gives up waiting
+
+# Focus follows requests and clicks; no keys of its own.
+OPENBOX_RULES = """<?xml version="1.0"?>
+<openbox_config xmlns="http://openbox.org/3.4/rc">
+<focus><focusNew>yes</focusNew></focus>
+<keyboard/>
+<mouse><context name="Client"><mousebind button="Left" action="Press">
+<action name="Focus"/><action name="Raise"/></mousebind></context></mouse>
+</openbox_config>
+"""
 
 
 class Failure(Exception):
@@ -32,6 +44,8 @@ def skip_without_display():
 
 class Desktop:
     """The program with a display. `arguments` and `settings` (lines of the configuration file) as it starts."""
+
+    managed = False  # displays have a window manager; run() sets it
 
     def __init__(self, folder, *arguments, settings=(), size=(1280, 900)):
         self.folder = Path(folder)
@@ -71,8 +85,23 @@ class Desktop:
             LC_ALL="C.UTF-8", LANGUAGE="en",
             GTK_THEME="Adwaita",
             ASAN_OPTIONS=os.environ.get("ASAN_OPTIONS", "") + ":detect_leaks=0")
+        self.manager = self.start_manager() if self.managed else None
         self.start()
         return self
+
+    def start_manager(self):
+        """A window manager: windows are raised, maximized, and given the keyboard as on a user's screen."""
+        rules = self.folder / "openbox.xml"
+        rules.write_text(OPENBOX_RULES)
+        manager = subprocess.Popen(["openbox", "--sm-disable", "--config-file", str(rules)],
+                                   env=self.environment, stdin=subprocess.DEVNULL,
+                                   stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL)
+        end = time.monotonic() + PATIENCE
+        while not self.xdotool("get_num_desktops"):
+            if manager.poll() is not None or time.monotonic() > end:
+                raise Failure("openbox did not start")
+            time.sleep(0.05)
+        return manager
 
     def __exit__(self, kind, error, trace):
         if kind is not None:
@@ -85,6 +114,9 @@ class Desktop:
                 self.program.wait(10)
             except subprocess.TimeoutExpired:
                 self.program.kill()
+        if self.manager is not None:
+            self.manager.terminate()
+            self.manager.wait()
         self.server.terminate()
         self.server.wait()
         self.frames.cleanup()
@@ -139,17 +171,19 @@ class Desktop:
         return done.stdout.split()
 
     def focus(self, title, settle=True, native=False):
-        """Gives the keyboard to the window of a title: there is no window manager to do it. Waits
+        """Gives the keyboard to the window of a title: on a bare display nobody else does it. Waits
         until the window has been drawn, unless it is one that goes on changing. A `native` box is
         the toolkit's own: the log never tells of it."""
         end = time.monotonic() + PATIENCE
         while time.monotonic() < end:
             windows = self.xdotool("search", "--onlyvisible", "--name", title)
             if windows:
-                self.xdotool("windowraise", windows[-1])
+                if not self.managed:
+                    self.xdotool("windowraise", windows[-1])
                 if self.xdotool("getwindowfocus") != windows[-1:]:
                     known = self.log_text().count(" active ")
-                    self.xdotool("windowfocus", "--sync", windows[-1])
+                    self.xdotool("windowactivate" if self.managed else "windowfocus", "--sync",
+                                 windows[-1])
                     # Keys that come before the program knows of it go nowhere.
                     while not native and self.log_text().count(" active ") == known:
                         if time.monotonic() >= end:
@@ -206,22 +240,43 @@ def png_of_xwd(data):
     return b"\x89PNG\r\n\x1a\n" + chunk(b"IHDR", head) + pixels + chunk(b"IEND", b"")
 
 
-def run(*tests):
-    """Runs test functions of a folder each; exits with their outcome."""
+def needs_manager(test):
+    """Marks a test that means nothing on a bare display."""
+    test.needs_manager = True
+    return test
+
+
+def run(*tests, displays=(BARE, OPENBOX)):
+    """Runs test functions of a folder each on these displays; exits with their outcome. Names of tests as arguments of
+    the script run these alone."""
     skip_without_display()
     failed = 0
-    for test in tests:
-        with tempfile.TemporaryDirectory() as folder:
-            try:
-                test(Path(folder))
-                print(f"{test.__name__}: ok")
-            except (Failure, AssertionError) as failure:
-                failed += 1
-                print(f"{test.__name__}: {failure or 'assertion failed'}")
-                if isinstance(failure, AssertionError):
-                    import traceback
-                    traceback.print_exc()
+    for display in displays:
+        if display == OPENBOX and shutil.which(OPENBOX) is None:
+            print("openbox is not installed: left out")
+            continue
+        Desktop.managed = display == OPENBOX
+        for test in tests:
+            if getattr(test, "needs_manager", False) and not Desktop.managed:
+                continue
+            if sys.argv[1:] and test.__name__ not in sys.argv[1:]:
+                continue
+            failed += not succeeds(test)
     sys.exit(1 if failed else 0)
+
+
+def succeeds(test):
+    name = test.__name__ + (" under openbox" if Desktop.managed else "")
+    with tempfile.TemporaryDirectory() as folder:
+        try:
+            test(Path(folder))
+            print(f"{name}: ok")
+            return True
+        except (Failure, AssertionError) as failure:
+            print(f"{name}: {failure or 'assertion failed'}")
+            if isinstance(failure, AssertionError):
+                traceback.print_exc()
+    return False
 
 
 def gif_of_frames(delays, size=(400, 300)):
