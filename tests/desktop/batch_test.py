@@ -70,6 +70,37 @@ def convert_and_collide(folder):
         assert sorted(path.name for path in out.iterdir()) == ["one.png", "two.png"]
 
 
+def destination_step(folder):
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["one.bmp"])
+    with Desktop(folder, pictures, settings=["DefaultFileExtension=jpg", "DestForceSourceDir=1",
+                                             "WarnDestinationWrite=0"]) as desktop:
+        desktop.wait(r"lines=1 .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+a", "ctrl+e")
+        desktop.wait(r"destination First: .*/pictures/one.jpg ")
+        desktop.focus("^Convert$")
+        # A bare name is a folder of the folder shown.
+        desktop.key("alt+i", "Tab", "ctrl+a")
+        desktop.type("out")
+        desktop.wait(r"destination First: .*/pictures/out/one.jpg ")
+        # Shift brings up the format's options; Cancel there goes back to the step.
+        desktop.key("shift+Return")
+        desktop.wait(r"prompt options jpg")
+        desktop.focus("^JPG options$")
+        desktop.key("Escape")
+        desktop.focus("^Convert$")
+        desktop.key("shift+Return")
+        desktop.wait(r"prompt options jpg")
+        desktop.focus("^JPG options$")
+        desktop.key("Return")
+        desktop.wait(rf'prompt confirm Folder "{pictures}/out" does not exist')
+        desktop.focus("^Fotomill Professional$", native=True)
+        desktop.key("Return")
+        desktop.wait(rf"batch-line .*one.bmp -> {pictures}/out/one.jpg")
+        desktop.wait(r"batch closes")
+
+
 def errors_stay_and_abort_stops(folder):
     pictures = folder / "pictures"
     make_pictures(pictures, ["p.bmp"])
@@ -110,4 +141,4 @@ def errors_stay_and_abort_stops(folder):
         assert len(desktop.xdotool("search", "--onlyvisible", "--name", "^Progress$")) == 2
 
 
-run(convert_and_collide, errors_stay_and_abort_stops)
+run(convert_and_collide, destination_step, errors_stay_and_abort_stops)

@@ -1,11 +1,15 @@
 #include "desktop/models/batch/destination_choice.h"
 
+#include <algorithm>
+
 #include "batch/destination_name.h"
 #include "batch/new_job.h"
 #include "core/text.h"
 #include "platform/existence.h"
 #include "platform/files.h"
+#include "platform/folders.h"
 #include "platform/paths.h"
+#include "platform/volumes.h"
 #include "registry/registry.h"
 #include "settings/history_list.h"
 #include "texts/texts.h"
@@ -19,6 +23,15 @@ int32_t RowOf(const std::string& extension) {
     if (EqualIgnoringCase(FormatRow(row).extension, extension)) return row;
   }
   return FindPluginFormat("x." + extension);
+}
+
+// The folder, or the nearest one above it that is there.
+std::string ExistingFolder(std::string folder) {
+  while (folder.size() > 1 && !platform::FileExists(folder)) {
+    if (folder.back() == platform::kSeparator) folder.pop_back();
+    folder = platform::FolderOf(folder);
+  }
+  return folder;
 }
 
 }  // namespace
@@ -57,9 +70,24 @@ std::string DestinationProblem(const DestinationChoice& choice) {
   return {};
 }
 
-std::string FirstDestination(const DestinationChoice& choice, const std::string& source) {
-  if (!DestinationProblem(choice).empty()) return {};
-  return PlannedDestination(source, {}, {}, JobFor(choice));
+std::string WholeFolder(const std::string& typed, const std::string& shown) {
+  const bool relative =
+      platform::SplitPath(typed).drive.empty() && !typed.starts_with(platform::kSeparator);
+  return typed.empty() || !relative ? typed
+                                    : platform::AbsolutePath(platform::JoinFolder(shown, typed));
+}
+
+DestinationOutlook OutlookOf(const DestinationChoice& choice,
+                             const std::vector<std::string>& files) {
+  const BatchJob job = JobFor(choice);
+  DestinationOutlook outlook;
+  for (size_t i = 0; i < std::min(files.size(), kMostLookedUp); ++i) {
+    const std::string path = PlannedDestination(files[i], {}, {}, job);
+    if (i == 0) outlook.first = path;
+    outlook.existing += platform::ExistenceOf(path) == platform::Existence::Yes;
+  }
+  outlook.freeSpace = platform::FreeSpace(ExistingFolder(platform::FolderOf(outlook.first)));
+  return outlook;
 }
 
 BatchJob JobFor(const DestinationChoice& choice) {
@@ -67,6 +95,7 @@ BatchJob JobFor(const DestinationChoice& choice) {
   job.formatIndex = RowOf(choice.extension);
   job.extension = UpperCase(choice.extension);
   job.destinationFolder = choice.folder;
+  job.naming.beside = choice.folder.empty();
   return job;
 }
 

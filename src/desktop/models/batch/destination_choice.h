@@ -32,10 +32,22 @@ std::vector<std::string> RecentDestinations();
 // What is wrong with a choice, a whole sentence; empty when nothing is.
 std::string DestinationProblem(const DestinationChoice& choice);
 
-// The path that the first file's output is going to have, before anyone looks whether it is free.
-std::string FirstDestination(const DestinationChoice& choice, const std::string& source);
+// The folder that a typed one means, as a whole path: relative ones are inside `shown`, the folder
+// of the browser. Empty stays empty.
+std::string WholeFolder(const std::string& typed, const std::string& shown);
 
-// A job that writes to the choice. The choice has no problem.
+// What the destination step tells before anything is written.
+struct DestinationOutlook {
+  std::string first;       // path of the first file's output, free or not
+  uint64_t freeSpace = 0;  // bytes where it goes; 0: unknown
+  size_t existing = 0;     // outputs whose name is taken, among the first kMostLookedUp
+};
+inline constexpr size_t kMostLookedUp = 500;
+// Of a choice without a problem, for at least one file.
+DestinationOutlook OutlookOf(const DestinationChoice& choice,
+                             const std::vector<std::string>& files);
+
+// A job that writes to the choice, whatever DestForceSourceDir says. The choice has no problem.
 BatchJob JobFor(const DestinationChoice& choice);
 
 }  // namespace fotomill::desktop

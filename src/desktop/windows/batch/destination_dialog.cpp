@@ -13,15 +13,16 @@
 #include "core/choice_lists.h"
 #include "core/text.h"
 #include "desktop/models/browser/browser_model.h"
+#include "desktop/models/shell/event_log.h"
 #include "desktop/windows/setup/override_box.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
-#include "platform/volumes.h"
 #include "registry/registry.h"
 #include "settings/history_list.h"
 #include "settings/settings.h"
+#include "texts/grouped_count.h"
 
 namespace fotomill::desktop {
 
@@ -29,7 +30,8 @@ DestinationDialog::DestinationDialog(wxWindow* parent, const wxString& verb,
                                      const std::vector<std::string>& files)
     : wxDialog(parent, wxID_ANY, verb, wxDefaultPosition, wxDefaultSize,
                wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "DestinationBox"),
-      files_(files) {
+      files_(files),
+      shownFolder_(platform::FolderOf(files_.front())) {
   const int gap = FromDIP(8);
   auto* sizer = new wxBoxSizer(wxVERTICAL);
   const auto below = wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxTOP, gap * 3 / 2);
@@ -55,8 +57,7 @@ DestinationDialog::DestinationDialog(wxWindow* parent, const wxString& verb,
   for (const std::string& folder : RecentDestinations())
     folder_->Append(wxString::FromUTF8(folder));
   folder_->SetValue(folder_->GetCount() > 0 ? folder_->GetString(0)
-                                            : wxString::FromUTF8(std::string(
-                                                  platform::SplitPath(files_.front()).folder)));
+                                            : wxString::FromUTF8(shownFolder_));
   folder_->AutoCompleteDirectories();
   browse_ = new wxButton(this, wxID_ANY, Label("B&rowse..."));
   folderRow->Add(into_, wxSizerFlags().CenterVertical().Border(wxRIGHT, gap));
@@ -96,8 +97,10 @@ DestinationDialog::DestinationDialog(wxWindow* parent, const wxString& verb,
   into_->Bind(wxEVT_RADIOBUTTON, [this](wxCommandEvent&) { UpdateControls(); });
   folder_->Bind(wxEVT_TEXT, [this](wxCommandEvent&) { UpdateControls(); });
   browse_->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { Browse(); });
-  options_->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { ShowFormatOptions(); });
-  ok_->Bind(wxEVT_BUTTON, &DestinationDialog::OnOk, this);
+  options_->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { (void)ShowFormatOptions(); });
+  ok_->Bind(wxEVT_BUTTON,
+            [this](wxCommandEvent& event) { event.Skip(Accept(wxGetKeyState(WXK_SHIFT))); });
+  Bind(wxEVT_CHAR_HOOK, &DestinationDialog::OnKey, this);
   SetSizerAndFit(sizer);
   CentreOnParent();
   UpdateControls();
@@ -107,7 +110,7 @@ DestinationDialog::DestinationDialog(wxWindow* parent, const wxString& verb,
 DestinationChoice DestinationDialog::Choice() const {
   DestinationChoice choice;
   choice.extension = formats_[static_cast<size_t>(format_->GetSelection())].extension;
-  if (into_->GetValue()) choice.folder = Utf8(folder_->GetValue());
+  if (into_->GetValue()) choice.folder = WholeFolder(Utf8(folder_->GetValue()), shownFolder_);
   choice.reduce = reduce_->GetValue();
   choice.autoOrient = orient_->GetValue();
   choice.keepMetadata = metadata_->GetValue();
@@ -121,18 +124,28 @@ void DestinationDialog::UpdateControls() {
   options_->Show(HasOverrideBox(choice.extension));
   const std::string problem = DestinationProblem(choice);
   ok_->Enable(problem.empty() && (!into_->GetValue() || !choice.folder.empty()));
-  const std::string first = FirstDestination(choice, files_.front());
-  wxString text = problem.empty() ? Label("First: %1", Shown(first)) : Shown(problem);
-  const uint64_t space =
-      platform::FreeSpace(choice.folder.empty() ? files_.front() : choice.folder);
-  if (problem.empty() && space > 0)
-    text = Label("%1 (%2 free)", text, Shown(SizeText(space, choice::kSizeFitting)));
-  preview_->SetLabel(text);
+  const std::string outlook = problem.empty() ? OutlookText(choice) : problem;
+  LogEvent("destination", outlook);
+  preview_->SetLabel(Shown(outlook));
   Layout();
 }
 
-void DestinationDialog::ShowFormatOptions() {
-  (void)ShowOverrideBox(this, formats_[static_cast<size_t>(format_->GetSelection())].extension);
+// "First: /photos/a.png (18.2 GB free), 3 outputs exist already"
+std::string DestinationDialog::OutlookText(const DestinationChoice& choice) const {
+  const DestinationOutlook outlook = OutlookOf(choice, files_);
+  std::string text = Tr("First: %1", outlook.first);
+  if (outlook.freeSpace > 0)
+    text = Tr("%1 (%2 free)", text, SizeText(outlook.freeSpace, choice::kSizeFitting));
+  if (outlook.existing > 0)
+    text.append(", ").append(
+        TrGroupedCount("%1 output exists already", "%1 outputs exist already", outlook.existing));
+  return text;
+}
+
+bool DestinationDialog::ShowFormatOptions() {
+  const std::string& extension = formats_[static_cast<size_t>(format_->GetSelection())].extension;
+  LogEvent("prompt", "options " + extension);
+  return ShowOverrideBox(this, extension);
 }
 
 void DestinationDialog::Browse() {
@@ -141,15 +154,24 @@ void DestinationDialog::Browse() {
   UpdateControls();
 }
 
-// Shift brings up the format's own options on the way.
-void DestinationDialog::OnOk(wxCommandEvent& event) {
-  if (wxGetKeyState(WXK_SHIFT) && ShiftOpensOverrideBox()) ShowFormatOptions();
+// The toolkit's default button knows Enter alone; Shift+Enter is OK with Shift held.
+void DestinationDialog::OnKey(wxKeyEvent& event) {
+  const bool enter = event.GetKeyCode() == WXK_RETURN || event.GetKeyCode() == WXK_NUMPAD_ENTER;
+  if (!enter || event.GetModifiers() != wxMOD_SHIFT) return event.Skip();
+  if (ok_->IsEnabled() && Accept(true)) EndModal(wxID_OK);
+}
+
+// Takes the choice. Shift brings up the format's own options on the way; Cancel in them goes back
+// to this step.
+bool DestinationDialog::Accept(bool shift) {
+  const bool options = shift && ShiftOpensOverrideBox() && HasOverrideBox(Choice().extension);
+  if (options && !ShowFormatOptions()) return false;
   const DestinationChoice choice = Choice();
   if (!choice.folder.empty())
     (void)AddToHistoryList(HistoryList::Destination, platform::AbsolutePath(choice.folder));
   settings.DefaultFileExtension.AssignCut(choice.extension);
   settings.DestForceSourceDir = choice.folder.empty() ? 1 : 0;
-  event.Skip();
+  return true;
 }
 
 }  // namespace fotomill::desktop

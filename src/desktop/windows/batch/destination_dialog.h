@@ -25,11 +25,14 @@ class DestinationDialog : public wxDialog {
 
  private:
   void UpdateControls();
-  void ShowFormatOptions();
+  bool ShowFormatOptions();  // false: canceled
+  std::string OutlookText(const DestinationChoice& choice) const;
   void Browse();
-  void OnOk(wxCommandEvent& event);
+  void OnKey(wxKeyEvent& event);
+  bool Accept(bool shift);  // false: the step is not over
 
   const std::vector<std::string> files_;
+  const std::string shownFolder_;  // in which relative folders are
   const std::vector<DestinationFormat> formats_ = DestinationFormats();
   wxChoice* format_ = nullptr;
   wxButton* options_ = nullptr;
