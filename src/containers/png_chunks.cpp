@@ -32,7 +32,7 @@ bool PngWalk::Next(PngPlace& chunk) {
   const uint32_t size = head.Be32();
   chunk = {TextOf(head.Take(4)), next_ + 8, size};
   if (!head.Ok()) return End(Status::FileReadError);
-  if (!std::ranges::all_of(chunk.type, IsLetter)) return End(Status::DamagedFile);  // a hole, perhaps
+  if (!std::ranges::all_of(chunk.type, IsLetter)) return End(Status::DamagedFile);  // maybe a hole
   next_ = chunk.End();
   ended_ = chunk.type == "IEND";
   return true;

@@ -8,8 +8,8 @@ namespace fotomill {
 
 namespace {
 
-// So that Abort is seen in time and cores finish together. One core alone has more bands, but
-// larger ones than they could be: what two of them need is computed twice.
+// Several bands per core, so that Abort responds quickly and cores finish together. A single core
+// gets more bands, but not the smallest ones possible, as adjacent bands compute some rows twice.
 constexpr int32_t kBandsACore = 4, kBandsAlone = 16, kLeastAlone = 4;
 
 }  // namespace

@@ -5,8 +5,8 @@
 
 namespace fotomill {
 
-// The smallest rectangle that holds all pixels in which two canvases of one size differ; pixels
-// that are transparent in both do not. One pixel at the top left where nothing differs.
+// The bounding box of all pixels that differ between two canvases of the same size; pixels that are
+// transparent in both are equal. One pixel at the top left if nothing differs.
 Rectangle ChangedArea(const Canvas& before, const Canvas& after);
 
 }  // namespace fotomill

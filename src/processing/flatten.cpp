@@ -12,7 +12,7 @@ namespace {
 
 constexpr int32_t kAtOnce = 64;  // pixels
 
-// The background as often as a block of pixels needs it.
+// The background, repeated for a block of pixels.
 struct Background {
   uint8_t bgr[3 * kAtOnce];
   explicit Background(Color color) {
@@ -22,7 +22,7 @@ struct Background {
 
 void BlendBlock(uint8_t* bgr, const uint8_t* alpha, int32_t pixels, const Background& background) {
   if (std::all_of(alpha, alpha + pixels, [](uint8_t a) { return a == 255; })) return;
-  // each alpha three times, so that the loop below sees bytes that do not differ in kind
+  // each alpha three times, so that the inner loop treats all bytes alike
   uint8_t spread[3 * kAtOnce + 1];
   for (int32_t i = 0; i < pixels; ++i) {
     const uint32_t four = alpha[i] * 0x01010101u;

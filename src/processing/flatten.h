@@ -5,15 +5,15 @@
 
 namespace fotomill {
 
-// Composites a picture that has an alpha plane onto its background color (the record's own when it
-// says so, else its `defaultColour`) and frees the plane: 24 bits in place, per channel (background
-// x (255 - a) + pixel x a) / 255, rounded to nearest. A palette picture is blended the same way and
-// gets the shallowest palette that holds the blended colors, or 24 bits when there are more than
-// 256. A picture without a plane is left as it is. MemoryAllocationError, for palette pictures
-// only, leaves it unchanged or, still with its plane, at 24 bits.
+// Composites a picture with an alpha plane onto its background color (the record's own if set, else
+// its `defaultColour`) and frees the plane: 24 bits in place, per channel (background x (255 - a) +
+// pixel x a) / 255, rounded to nearest. Palette pictures are blended likewise and get the smallest
+// palette for the blended colors, or 24 bits if there are more than 256. A picture without a plane
+// is unchanged. MemoryAllocationError, for palette pictures only, leaves it unchanged or, with its
+// plane, at 24 bits.
 Status FlattenAlpha(PictureRecord& picture);
 
-// Whether an alpha plane has nothing but 255.
+// Whether all values of an alpha plane are 255.
 bool IsOpaque(const PackedImage& alpha);
 
 }  // namespace fotomill

@@ -8,24 +8,24 @@
 
 namespace fotomill {
 
-// The rows of an image for filters that look at neighbors: a row has `reach` more pixels to the
-// left and to the right, and there are `reach` more rows above and below, all of which repeat the
-// edge. The last 2 x reach + 1 rows are kept, so that a filter that goes down row by row copies
-// each row once. For 24-bit images (three bytes per pixel) and for alpha planes and other 8-bit
-// images (one byte). One object a band. The image must outlive it and not change.
+// Rows of an image for filters that look at neighbors: padded by `reach` pixels on the left and
+// right, and by `reach` rows above and below, by repeating the edge. The last 2 x reach + 1 rows
+// are cached, so that a top-down filter copies each row once. For 24-bit images (three bytes per
+// pixel), alpha planes and other 8-bit images (one byte). One object per band. The image must
+// outlive it and not change.
 class PaddedRows {
  public:
-  // UnsuitableImage for images of 1 or 4 bits, MemoryAllocationError without room.
+  // UnsuitableImage for images of 1 or 4 bits, or MemoryAllocationError.
   Status Open(const PackedImage& image, int32_t reach);
-  // Pixel (0, y); columns from -reach to width + reach - 1 may be read from there. y may be `reach`
-  // rows outside. Good as long as no row is asked for that is more than 2 x reach away.
+  // Pixel (0, y); readable from column -reach to width + reach - 1. y may be up to `reach` rows
+  // outside. Valid until a row more than 2 x reach away is requested.
   const uint8_t* Row(int32_t y);
 
  private:
   const PackedImage* image_ = nullptr;
   int32_t reach_ = 0, kept_ = 0;
   size_t pixel_ = 3, stride_ = 0;
-  platform::MemoryBlock rows_, held_;  // `kept_` padded rows, and which row each is
+  platform::MemoryBlock rows_, held_;  // `kept_` padded rows, and their row numbers
 };
 
 }  // namespace fotomill

@@ -8,8 +8,8 @@ namespace fotomill {
 
 namespace {
 
-// For each byte of a plane its eight bits as the lowest bits of eight 4-bit pixels, the first pixel
-// in the top bits.
+// Maps each byte of a plane to the lowest bits of eight 4-bit pixels, the first pixel in
+// the top bits.
 constexpr std::array<uint32_t, 256> MakeSpreadBits() {
   std::array<uint32_t, 256> table{};
   for (uint32_t bits = 0; bits < 256; ++bits) {
@@ -19,7 +19,7 @@ constexpr std::array<uint32_t, 256> MakeSpreadBits() {
 }
 constexpr std::array<uint32_t, 256> kSpreadBits = MakeSpreadBits();
 
-// The lowest bits of eight 4-bit pixels as one byte, the first pixel in the top bit.
+// Packs the lowest bits of eight 4-bit pixels into a byte, the first pixel in the top bit.
 constexpr uint8_t GatherBits(uint32_t pixels) {
   pixels &= 0x11111111;
   pixels = (pixels | pixels >> 3) & 0x03030303;
@@ -28,10 +28,10 @@ constexpr uint8_t GatherBits(uint32_t pixels) {
 }
 static_assert(GatherBits(kSpreadBits[0xA7]) == 0xA7);
 
-// How many of the pixels the functions below have done; the plain loops do the rest.
+// Each of these returns the number of pixels processed; the scalar loops do the rest.
 #ifdef BYTE_SHUFFLE
 
-constexpr char kNone = -128;  // an index that gives 0
+constexpr char kNone = -128;  // an index that selects 0
 
 BYTE_SHUFFLE __m128i Load(const uint8_t* bytes) {
   return _mm_loadu_si128(reinterpret_cast<const __m128i*>(bytes));
@@ -40,8 +40,7 @@ BYTE_SHUFFLE void Store(uint8_t* bytes, __m128i value) {
   _mm_storeu_si128(reinterpret_cast<__m128i*>(bytes), value);
 }
 
-// Every third byte of 48, from byte `first` on: three registers, each shuffled to where its bytes
-// belong.
+// Every third byte of 48, starting at byte `first`: shuffles and combines three registers.
 BYTE_SHUFFLE __m128i EveryThird(__m128i a, __m128i b, __m128i c, int first) {
   alignas(16) static constexpr char kIndices[3][3][16] = {
       {{0, 3, 6, 9, 12, 15, kNone, kNone, kNone, kNone, kNone, kNone, kNone, kNone, kNone, kNone},
@@ -73,7 +72,7 @@ BYTE_SHUFFLE size_t SplitColorsFast(const uint8_t* bgr, size_t count, uint8_t* b
   return x;
 }
 
-// Sixteen bytes of the merged row, from byte 16 x `part` on.
+// Sixteen bytes of the interleaved row, starting at byte 16 x `part`.
 BYTE_SHUFFLE __m128i Interleaved(__m128i blue, __m128i green, __m128i red, int part) {
   alignas(16) static constexpr char kIndices[3][3][16] = {
       {{0, kNone, kNone, 1, kNone, kNone, 2, kNone, kNone, 3, kNone, kNone, 4, kNone, kNone, 5},
@@ -105,7 +104,7 @@ BYTE_SHUFFLE size_t MergeColorsFast(const uint8_t* blue, const uint8_t* green, c
   return x;
 }
 
-// Four pixels at a time; the store writes four bytes too many, so the last pixels are left.
+// Four pixels at a time; the store writes four extra bytes, so the last pixels are excluded.
 BYTE_SHUFFLE size_t DropFourthFast(const uint8_t* bgrx, size_t count, uint8_t* bgr) {
   const __m128i indices =
       _mm_setr_epi8(0, 1, 2, 4, 5, 6, 8, 9, 10, 12, 13, 14, kNone, kNone, kNone, kNone);
@@ -114,7 +113,7 @@ BYTE_SHUFFLE size_t DropFourthFast(const uint8_t* bgrx, size_t count, uint8_t* b
   return x;
 }
 
-// Five pixels at a time; the store writes a byte too many, so the last pixels are left.
+// Five pixels at a time; the store writes one extra byte, so the last pixels are excluded.
 BYTE_SHUFFLE size_t SwapColorsFast(const uint8_t* source, size_t count, uint8_t* target) {
   const __m128i indices = _mm_setr_epi8(2, 1, 0, 5, 4, 3, 8, 7, 6, 11, 10, 9, 14, 13, 12, kNone);
   size_t x = 0;

@@ -8,7 +8,7 @@ namespace fotomill {
 
 namespace {
 
-// Spreads a row of palette indices into one byte each.
+// Unpacks a row of palette indices to one byte each.
 template <int bits>
 void UnpackIndices(const uint8_t* packed, int32_t width, uint8_t* indices) {
   constexpr int32_t kPerByte = 8 / bits;
@@ -21,8 +21,7 @@ void UnpackIndices(const uint8_t* packed, int32_t width, uint8_t* indices) {
   for (int32_t i = 0; x < width; ++x, ++i) indices[x] = *packed >> (8 - bits * (i + 1)) & kMask;
 }
 
-// Each pixel's table entry of four bytes is stored whole where the next pixel overwrites its fourth
-// byte.
+// Stores each pixel's four-byte table entry as a whole; the next pixel overwrites the fourth byte.
 template <int bits>
 void ExpandRow(const uint8_t* packed, const uint8_t* colorTable, int32_t width, uint8_t* bgr) {
   constexpr int32_t kPerByte = 8 / bits;

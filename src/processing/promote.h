@@ -14,12 +14,12 @@ namespace fotomill {
 // its block.
 class BgrRows {
  public:
-  // MemoryAllocationError if there is no room for a row.
+  // MemoryAllocationError if memory runs out.
   Status Open(const PackedImage& image);
-  // Row y from the top: blue, green, red of each pixel; a view of the image itself when that has 24
-  // bits, else a row of this reader, which the next call overwrites.
+  // Row y from the top: blue, green, red of each pixel; a view of the image itself if it has 24
+  // bits, else a buffer that the next call overwrites.
   const uint8_t* Row(int32_t y);
-  // The same into `bgr`, three bytes per pixel.
+  // As Row, but copies to `bgr`, three bytes per pixel.
   void CopyRow(int32_t y, uint8_t* bgr) const;
 
  private:
@@ -27,43 +27,43 @@ class BgrRows {
                           uint8_t* bgr);
 
   const PackedImage* image_ = nullptr;
-  Expand expand_ = nullptr;  // chosen by depth; null for 24 bits
+  Expand expand_ = nullptr;  // by depth; null for 24 bits
   std::array<uint8_t, 1024> colors_{};
   platform::MemoryBlock row_;
 };
 
-// Makes a copy of `image` at a greater depth: 4, 8 or 24 bits. A deeper palette image keeps its
-// indices and the colors of the shallower one at the front of its table, the rest black.
-// UnsuitableImage when `bits` is not above the image's depth, else as NewPackedImage.
+// Copies `image` at a greater depth: 4, 8 or 24 bits. Palette images keep their indices and colors;
+// additional palette entries are black. UnsuitableImage if `bits` is not above the image's depth,
+// else as NewPackedImage.
 Status PromoteImage(const PackedImage& image, int32_t bits, PackedImage& promoted);
 
-// Replaces the picture's image by one of at least `bits` (as PromoteImage) and sets `bitsPerPixel`.
-// A picture that is as deep already stays as it is. On failure the picture is unchanged.
+// Converts the picture's image to at least `bits` (as PromoteImage) and sets `bitsPerPixel`.
+// Pictures of that depth are unchanged. On failure the picture is unchanged.
 Status PromotePicture(PictureRecord& picture, int32_t bits = 24);
 
-// Brings a picture to 24 bits with an alpha plane, opaque where it had none. Statuses as
-// NewPackedImage; on failure the picture may have been promoted but is whole.
+// Converts a picture to 24 bits with an alpha plane, opaque if it had none. Statuses as
+// NewPackedImage; on failure the picture may have been promoted but is valid.
 Status PromoteToAlpha(PictureRecord& picture);
 
-// The distinct colors of an image, up to a number, with the index of each.
+// The distinct colors of an image, up to a limit, with an index for each.
 class ColorSet {
  public:
   static constexpr int32_t kMost = 256;
 
   ColorSet() { slots_.fill(kFree); }  // empty
-  // Takes in the pixels of a row, blue, green, red. False, at once, when there are more than `most`
-  // colors.
+  // Adds the pixels of a row, blue, green, red. Returns false as soon as there are more
+  // than `most` colors.
   bool AddRow(const uint8_t* bgr, int32_t width, int32_t most = kMost);
-  int32_t Count() const { return count_; }  // different colors so far
-  // Puts the colors into order of brightness, numbers them, and writes them to `palette`, black
-  // behind the last.
+  int32_t Count() const { return count_; }  // distinct colors so far
+  // Sorts and numbers the colors by brightness, and
+  // writes them to `palette`, padded with black.
   void Number(Palette& palette);
-  // The number of a color, 0x00RRGGBB, that is in the set.
+  // The index of a color, 0x00RRGGBB, which must be in the set.
   uint8_t IndexOf(uint32_t color) const { return indices_[SlotOf(color)]; }
 
  private:
   static constexpr uint32_t kFree = 0xffffffff;
-  static constexpr uint32_t kSlots = 1024;  // four a color, so that a search ends soon
+  static constexpr uint32_t kSlots = 1024;  // four per color, to keep probing short
   uint32_t SlotOf(uint32_t color) const {
     uint32_t slot = (color * 0x9e3779b1u) >> 22;
     while (slots_[slot] != color && slots_[slot] != kFree) slot = (slot + 1) % kSlots;
@@ -75,15 +75,15 @@ class ColorSet {
   int32_t count_ = 0;
 };
 
-// Replaces the picture's image by the shallowest palette image (1, 4 or 8 bits, at most `maxBits`)
-// that holds the colors that it uses, exactly, and sets palette and `bitsPerPixel`; the palette is
-// in order of brightness. `packed` tells whether that was done: not when there are too many colors,
-// nor when the image is as shallow already. The alpha plane stays. MemoryAllocationError leaves the
-// picture unchanged.
+// Converts the picture to the shallowest palette image (1, 4 or 8 bits, at
+// most `maxBits`) with exactly the colors it uses, sorted by brightness, and
+// sets palette and `bitsPerPixel`. `packed` tells whether that was done: not
+// if there are too many colors, or if the image is that shallow already. The
+// alpha plane is kept. MemoryAllocationError leaves the picture unchanged.
 Status PackFewColors(PictureRecord& picture, int32_t maxBits, bool& packed);
 
-// Packs a row of indices, one a byte, into pixels of 1, 4 or 8 bits from the most significant bit
-// down. Bits of the last byte behind the row's end become 0.
+// Packs a row of indices, one per byte, into pixels of 1, 4 or 8 bits, most significant bit first.
+// Padding bits in the last byte are 0.
 void PackIndices(const uint8_t* indices, int32_t width, int32_t bits, uint8_t* packed);
 
 }  // namespace fotomill

@@ -4,7 +4,7 @@
 
 namespace fotomill {
 
-// value / 255, rounded down, for every value below 65535, in 16-bit arithmetic.
+// value / 255, rounded down, for values below 65535, in 16-bit arithmetic.
 constexpr uint16_t DivideBy255(uint16_t value) {
   const auto next = static_cast<uint16_t>(value + 1);
   return static_cast<uint16_t>((next + (next >> 8)) >> 8);

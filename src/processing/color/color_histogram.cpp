@@ -4,7 +4,7 @@ namespace fotomill {
 
 namespace {
 
-constexpr uint32_t kCellBits = 6;  // of each channel
+constexpr uint32_t kCellBits = 6;  // per channel
 constexpr uint32_t kLowBits = 8 - kCellBits;
 constexpr uint32_t kLowMask = (1 << kLowBits) - 1;
 constexpr uint32_t kCellMask = (1 << kCellBits) - 1;

@@ -8,23 +8,23 @@
 
 namespace fotomill {
 
-// A group of similar colors: their mean and how many pixels have one of them.
+// A group of similar colors: their mean and their pixel count.
 struct ColorBin {
   float channel[3];  // blue, green, red, 0 to 255
   float weight;      // pixels
 };
 
-// Gathers the colors of a picture into 64 x 64 x 64 cells.
+// A color histogram with 64 x 64 x 64 cells.
 class ColorCells {
  public:
   Status Open();  // MemoryAllocationError
   void AddRow(const uint8_t* bgr, int32_t width);  // pixels of three bytes
-  // The cells that hold pixels.
+  // The non-empty cells.
   std::vector<ColorBin> Bins();
 
  private:
   struct Cell {
-    // sums of the bits below the cell's own: a packed image has too few pixels to overflow them
+    // sums of the bits below the cell's; a packed image has too few pixels to overflow them
     uint32_t low[3];
     uint32_t count;
   };
@@ -32,15 +32,15 @@ class ColorCells {
   platform::MemoryBlock cells_;
 };
 
-// Counts each color of a picture on its own: for pictures of at most kMostColors colors; others are
-// left out.
+// An exact color histogram for pictures of at most
+// kMostColors colors; further colors are ignored.
 class ColorCounts {
  public:
   static constexpr uint32_t kMostColors = 65536;
 
   Status Open();  // MemoryAllocationError
   void AddRow(const uint8_t* bgr, int32_t width);  // `width` pixels
-  std::vector<ColorBin> Bins();  // those that were met
+  std::vector<ColorBin> Bins();  // the colors found
 
  private:
   struct Slot {

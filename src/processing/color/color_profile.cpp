@@ -8,22 +8,22 @@
 
 #include "core/byte_reader.h"
 
-// Profiles of an unlikely size are left alone, and so are the tags of type 'mpet': a file of a few
-// megabytes can ask for a chain of a million steps there, which would keep a core busy for hours.
-// All other tags take a time that the library bounds, and hardly any profile has only those.
+// Profiles of implausible size are ignored, and so are tags of type 'mpet': a file of a few
+// megabytes can request a chain of a million steps there, which would keep a core busy for hours.
+// The library limits the time for all other tags, and hardly any profile relies on mpet alone.
 
 namespace fotomill {
 
 namespace {
 
 constexpr uint64_t kLargestProfile = 8 << 20;
-constexpr uint32_t kMostTags = 100;          // as many as the library reads
-// of a profile; the tag table follows: count, then name, offset, size of each
+constexpr uint32_t kMostTags = 100;          // the library's limit
+// bytes; followed by the tag table: count, then signature, offset and size of each tag
 constexpr uint64_t kHeaderSize = 128;
 constexpr uint32_t kStepsType = 0x6d706574;  // "mpet"
-constexpr uint8_t kHiddenTag = 'x';          // begins no name of a tag
+constexpr uint8_t kHiddenTag = 'x';          // starts no tag signature
 
-// The profile's bytes without the tags that are not trusted; empty when it is none.
+// The profile without untrusted tags; empty if it is not a profile.
 std::vector<uint8_t> TrustedTags(std::span<const uint8_t> profile) {
   if (profile.size() > kLargestProfile) return {};
   std::vector<uint8_t> trusted(profile.begin(), profile.end());

@@ -10,17 +10,17 @@
 #include "core/workers/share_out.h"
 #include "processing/color/color_profile.h"
 
-// The library works on whole pixels in the order of a packed image. It is told to keep no last
-// color in a transform, so that threads can share one.
+// Pixels are passed to the library as stored in a packed image. Its one-pixel cache is disabled, so
+// that threads can share a transform.
 
 namespace fotomill {
 
 namespace {
 
-constexpr uint64_t kPixelsPerBand = 1 << 18;  // fewer are not worth a thread
-constexpr int32_t kUnseen = 1;                // a difference of 8-bit values that rounding may make
+constexpr uint64_t kPixelsPerBand = 1 << 18;  // smaller bands are not worth a thread
+constexpr int32_t kUnseen = 1;                // possible rounding difference of 8-bit values
 
-// Null for bytes that are no profile of devices with RGB or gray colors.
+// Null if it is not a device profile for RGB or gray.
 Profile OpenProfile(std::span<const uint8_t> bytes) {
   const ProfileColors colors = ColorsOfProfile(bytes);
   const bool known = colors == ProfileColors::Rgb || colors == ProfileColors::Gray;
@@ -52,7 +52,7 @@ bool IsGray(const PackedImage& image) {
   return true;
 }
 
-// Divides rows among the cores that are free, `work` gets a first one and the one behind the last.
+// Distributes rows over the free cores; `work` gets the first row and the one after the last.
 Status ForBandsOfRows(int32_t rows, uint64_t pixels, const StopToken& stop,
                       const std::function<void(int32_t, int32_t)>& work) {
   const auto bands = static_cast<int32_t>(
@@ -73,7 +73,7 @@ ColorTransform::ColorTransform(std::span<const uint8_t> source, std::span<const 
   const Profile from = OpenSource(source), to = OpenScreen(screen);
   if (from == nullptr || to == nullptr) return;
   gray_ = cmsGetColorSpace(from.get()) == cmsSigGrayData;
-  // Grays are few: they need no short cut, which would cost dark ones their precision.
+  // For the few gray levels no optimization is needed; it would cost precision in the shadows.
   const cmsUInt32Number flags = gray_ ? cmsFLAGS_NOCACHE | cmsFLAGS_NOOPTIMIZE : cmsFLAGS_NOCACHE;
   transform_ = cmsCreateTransform(from.get(), gray_ ? TYPE_GRAY_8 : TYPE_BGR_8, to.get(),
                                   TYPE_BGR_8, INTENT_PERCEPTUAL, flags);
@@ -129,10 +129,9 @@ void ColorTransform::MapGrays(uint8_t* bgr, int32_t pixels) const {
     std::copy_n(&grays_[3 * size_t{*bgr}], 3, bgr);
 }
 
-// Whether a grid of colors and the line of grays, or for gray pictures all grays, come out
-// different.
+// Whether the transform changes any color of a test grid or any gray; for gray profiles, any gray.
 bool ColorTransform::ChangesTestColors() {
-  constexpr int32_t kSteps = 6, kGraySteps = 18;  // both end at 255
+  constexpr int32_t kSteps = 6, kGraySteps = 18;  // both include 0 and 255
   std::vector<uint8_t> colors, changed;
   const auto add = [&](int32_t blue, int32_t green, int32_t red) {
     for (const int32_t value : {blue, green, red}) colors.push_back(static_cast<uint8_t>(value));

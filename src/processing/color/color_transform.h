@@ -10,23 +10,23 @@
 
 namespace fotomill {
 
-// How the colors of an ICC profile become those of a screen, by the profile's perceptual intent.
-// Profiles of RGB and of gray pictures count; none, one of another kind and one that is damaged
-// stand for sRGB. Where the screen shows the colors as they are, nothing is changed.
+// Converts colors from an ICC profile to the screen's, with perceptual intent. RGB and gray
+// profiles are used; missing, damaged or other profiles count as sRGB. If source and screen are
+// equivalent, nothing is changed.
 class ColorTransform {
  public:
-  // `source` is the profile of the pictures, `screen` that of the screen, both as files hold them.
-  // Only one of RGB counts as the latter. Takes from a part of a millisecond to some milliseconds.
+  // `source` is the picture's profile, `screen` the screen's, as stored in files. The latter must
+  // be RGB. Takes up to a few milliseconds.
   explicit ColorTransform(std::span<const uint8_t> source, std::span<const uint8_t> screen = {});
   ~ColorTransform();
   ColorTransform(const ColorTransform&) = delete;
   ColorTransform& operator=(const ColorTransform&) = delete;
 
-  bool ChangesColors() const { return transform_ != nullptr; }  // false: Apply does nothing
-  // Changes the pixels of an image of 24 bits, or the color table of a smaller one; large images on
-  // all cores. A picture in colors with the profile of a gray one stays as it is. Any number of
-  // threads may call this at once. FunctionCancelled (4) when `stop` was asked meanwhile: a part of
-  // the pixels is changed then.
+  bool ChangesColors() const { return transform_ != nullptr; }  // false: Apply is a no-op
+  // Converts the pixels of a 24-bit image or the color table of a
+  // palette image; large images on all cores. Color pictures with a
+  // gray profile are left unchanged. Thread-safe. FunctionCancelled
+  // (4) if `stop` was requested; some pixels are converted then.
   Status Apply(PackedImage& image, const StopToken& stop = {}) const;
 
  private:
@@ -37,8 +37,8 @@ class ColorTransform {
   void MapGrays(uint8_t* bgr, int32_t pixels) const;
   bool ChangesTestColors();
 
-  void* transform_ = nullptr;  // the library's; null where nothing changes
-  bool gray_ = false;          // the profile is one of gray pictures: `grays_` says it all
+  void* transform_ = nullptr;  // the library's handle; null if nothing changes
+  bool gray_ = false;          // the source is a gray profile: only `grays_` is used
   std::array<uint8_t, 3 * kGrays> grays_{};
 };
 

@@ -9,10 +9,10 @@ namespace fotomill {
 
 namespace {
 
-constexpr int32_t kLeastRows = 64;  // of a band
+constexpr int32_t kLeastRows = 64;  // per band
 
-// Two sets of counters in turn: neighbors are often equal, and a counter is not ready again at
-// once.
+// Two alternating sets of counters: adjacent pixels are often equal, and incrementing the same
+// counter twice in a row would stall.
 using RowCounts = std::array<std::array<std::array<uint32_t, 256>, 3>, 2>;
 
 void CountRow(const uint8_t* bgr, int32_t width, RowCounts& counts) {

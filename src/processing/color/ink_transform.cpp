@@ -24,8 +24,8 @@ InkTransform::InkTransform(Kind kind, std::span<const uint8_t> profile) {
     return;
   const Profile to(cmsCreate_sRGBProfile());
   if (to == nullptr) return;
-  // The library's short cut for Lab is a grid that has no point at gray, so that white would not be
-  // white.
+  // The library's optimization for Lab uses a grid without a point at neutral gray, so white would
+  // be tinted.
   const cmsUInt32Number flags = lab ? cmsFLAGS_NOOPTIMIZE : 0;
   transform_ = cmsCreateTransform(from.get(), lab ? TYPE_Lab_8 : TYPE_CMYK_8_REV, to.get(),
                                   TYPE_BGR_8, INTENT_PERCEPTUAL, flags);

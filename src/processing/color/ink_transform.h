@@ -6,25 +6,25 @@
 
 namespace fotomill {
 
-// Pixels in printing inks or in CIE Lab as sRGB.
+// Converts CMYK or CIE Lab pixels to sRGB.
 class InkTransform {
  public:
-  // Cmyk: cyan, magenta, yellow, black, 255 for no ink. Lab: lightness from 0 to 255, and two
-  // values with 128 for none.
+  // Cmyk: cyan, magenta, yellow, black, 255 for no ink. Lab: lightness from 0 to 255, and a and b
+  // with 128 for neutral.
   enum class Kind { Cmyk, Lab };
 
-  // `profile` says how inks look, by its perceptual intent. Without one, and with one that is
-  // damaged or of other colors, light passes through one ink after the other.
+  // Uses the perceptual intent of `profile`. Without a valid one for these colors, inks are treated
+  // as a stack of ideal filters.
   InkTransform(Kind kind, std::span<const uint8_t> profile);
   ~InkTransform();
   InkTransform(const InkTransform&) = delete;
   InkTransform& operator=(const InkTransform&) = delete;
 
-  // `samples` has four bytes a pixel, or three of Lab; `bgr` gets blue, green, red.
+  // `samples` has four bytes per pixel, for Lab three; `bgr` receives blue, green, red.
   void Apply(const uint8_t* samples, size_t count, uint8_t* bgr) const;
 
  private:
-  void* transform_ = nullptr;  // the library's; null for the formula
+  void* transform_ = nullptr;  // the library's handle; null: use the formula
 };
 
 }  // namespace fotomill

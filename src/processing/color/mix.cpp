@@ -15,20 +15,19 @@ namespace fotomill {
 
 namespace {
 
-// Sums are fixed-point numbers: of a level that a sum can reach, 11 bits are whole and 20 a
-// fraction.
+// Sums are fixed-point: 11 integer bits cover the range of a sum, 20 bits are the fraction.
 constexpr int32_t kFraction = 20;
-// What rounding the three parts of a sum may have lost, so that ties still round up.
+// Compensates for rounding of the three terms, so that ties still round up.
 constexpr double kTieBias = 2;
 
 using Four [[gnu::vector_size(16)]] = int32_t;
 
-// What each value of each old channel adds to the new blue, green and red; the fourth number is 0.
+// Contribution of each old channel value to the new blue, green and red; the fourth number is 0.
 struct MixTables {
-  std::array<std::array<Four, 256>, 3> parts;  // of old blue, green, red
+  std::array<std::array<Four, 256>, 3> parts;  // for old blue, green, red
 };
 
-// The whole part of each sum, clamped to 0 to 255, from the lowest byte up.
+// The integer part of each sum, clamped to 0 to 255, lowest byte first.
 uint32_t Packed(Four sums) {
   const Four levels = sums >> kFraction;
 #ifdef __SSE2__
@@ -52,7 +51,7 @@ void ApplyMix(const MixTables& tables, uint8_t* bgr, size_t pixels) {
   };
   const auto store = [](uint8_t* to, uint32_t value) { std::memcpy(to, &value, sizeof value); };
   constexpr bool kLowestFirst = std::endian::native == std::endian::little;
-  // four pixels are three whole numbers
+  // four pixels are three 32-bit words
   for (; kLowestFirst && pixels >= 4; pixels -= 4, bgr += 12) {
     const uint32_t a = mixed(bgr), b = mixed(bgr + 3), c = mixed(bgr + 6), d = mixed(bgr + 9);
     store(bgr, a | b << 24);
@@ -81,7 +80,7 @@ MixMatrix Between(const MixMatrix& from, const MixMatrix& to, double share) {
   return matrix;
 }
 
-// Calls a function from color to color for each pixel.
+// Applies a function from color to color to each pixel.
 template <typename Function>
 PointEffect EachColor(Function function) {
   PointEffect effect;
@@ -91,9 +90,9 @@ PointEffect EachColor(Function function) {
   return effect;
 }
 
-// A hue is a place on a circle of six sectors. In each, one channel is the largest, one the
-// smallest, and one rises or falls between them. The places of those channels, blue 0, green 1,
-// red 2.
+// A hue is a position on a circle of six sectors. In each sector, one channel is the maximum,
+// one the minimum, and one rises or falls between them. Indices of those channels: blue 0, green
+// 1, red 2.
 struct Sector {
   uint8_t largest, between, smallest;
   bool rises;
@@ -111,8 +110,8 @@ int SectorOf(const uint8_t* bgr) {
   return 5;
 }
 
-// `turn`: sectors, 0 to 6. No division: places on the circle are counted in units of the pixel's
-// own chroma.
+// `turn`: 0 to 6 sectors. Avoids division: positions on the circle are in units of the
+// pixel's own chroma.
 void TurnHue(uint8_t* bgr, double turn) {
   const int from = SectorOf(bgr);
   const Sector& old = kSectors[from];

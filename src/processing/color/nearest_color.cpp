@@ -16,12 +16,12 @@ int32_t Distance(const Point& a, const Point& b) {
   return sum;
 }
 
-// From `count` colors picks those that can be nearest to a point of the cell of `width` levels
-// whose lowest corner is `corner`, the one nearest to its middle first. Returns their number.
+// Picks those of `count` colors that can be nearest to any point in the cell of `width` levels with
+// lowest corner `corner`, starting with the one nearest to its center. Returns how many.
 //
-// Whether color j beats color m at a point depends on the difference of the two distances, which is
-// linear in the point: at its most favourable corner it is the middle's difference less twice the
-// weighed half width per channel times how far the two colors are apart there.
+// Color j beats color m where its distance is smaller; the difference of the two squared distances
+// is linear in the point. Its minimum over the cell is the difference at the center, minus twice
+// the weighted half width times the distance of the two colors, per channel.
 int32_t PickCandidates(const ColorPoints& points, const uint8_t* from, int32_t count,
                        const Point& corner, int32_t width, uint8_t* picked) {
   const int32_t half = (width - 1) * ColorPoints::kUnits / 2;
@@ -84,7 +84,7 @@ void NearestColor::SetColors(const ColorPoints& points) {
   points_ = points;
   coarseKnown_.fill(false);
   if (fine_ != nullptr) std::memset(fineBlock_.Data(), 0xff, fineBlock_.Bytes().size());
-  groupsUsed_ = 1;  // place 0 would look like a single color
+  groupsUsed_ = 1;  // index 0 would look like a single color
   const Palette palette = PaletteOf(points);
   for (size_t i = 0; i < 256; ++i) {
     for (size_t c = 0; c < 3; ++c) levels_[i][c] = palette[3 * i + 2 - c];
@@ -99,8 +99,7 @@ const uint8_t* NearestColor::CoarseList(uint32_t cell) {
     const Point corner = {static_cast<int32_t>(cell & 15) << 4,
                           static_cast<int32_t>(cell >> 4 & 15) << 4,
                           static_cast<int32_t>(cell >> 8) << 4};
-    // One level wider than the cell itself, for points between its last level and the next cell's
-    // first.
+    // One level wider than the cell, for points between its last level and the next cell's first.
     list[0] =
         static_cast<uint8_t>(PickCandidates(points_, all, points_.count, corner, 17, list + 1) - 1);
     coarseKnown_[cell] = true;
@@ -135,7 +134,7 @@ uint32_t NearestColor::FillFine(uint32_t cell) {
              (count > 1 ? StoreGroups(list, (static_cast<uint32_t>(count) + 3) / 4) << 8 : 0);
 }
 
-// Stores a list of colors in groups of four and returns its place, 0 if there is no room.
+// Stores a list of colors in groups of four; returns its index, 0 if there is no room.
 uint32_t NearestColor::StoreGroups(const uint8_t* list, uint32_t groups) {
   const uint32_t place = groupsUsed_;
   if (place + groups > kMostGroups) return 0;

@@ -9,7 +9,7 @@ namespace fotomill {
 
 namespace {
 
-// The part of a picture that something of a size covers, and where that part begins in it.
+// The part of an image within an area; right and bottom are exclusive.
 struct Covered {
   int32_t left, right, top, bottom;
 };
@@ -21,9 +21,9 @@ Covered CoveredBy(const PackedImage& image, const Rectangle& area) {
           std::clamp(area.y, 0, image.Height()), end(area.y, area.height, image.Height())};
 }
 
-// One pixel over another that has alpha: colors are weighed by how much of each is seen.
+// Composites a pixel over one with alpha: colors are weighted by visibility.
 void Over(uint8_t* bgr, uint8_t& alpha, const uint8_t* above, uint8_t cover) {
-  const int32_t below = alpha * (255 - cover);  // of 255 x 255
+  const int32_t below = alpha * (255 - cover);  // in units of 255 x 255
   const int32_t whole = cover * 255 + below;
   if (whole == 0) return;
   for (int32_t channel = 0; channel < 3; ++channel) {
@@ -33,7 +33,7 @@ void Over(uint8_t* bgr, uint8_t& alpha, const uint8_t* above, uint8_t cover) {
   alpha = static_cast<uint8_t>((whole + 127) / 255);
 }
 
-// A row of a picture of 24 bits, with its alpha where it has any.
+// A row of a 24-bit picture, with its alpha if it has any.
 struct TargetRow {
   uint8_t* bgr;
   uint8_t* alpha;

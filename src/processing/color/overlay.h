@@ -10,28 +10,28 @@
 
 namespace fotomill {
 
-// Lays colors and pictures over a picture: Porter and Duff's "over", "Compositing Digital Images"
-// (1984). What would be outside the picture is left out.
+// Composites colors and pictures over a picture: the Porter-Duff "over" operator, "Compositing
+// Digital Images" (1984). Clipped to the picture.
 
-// Paints a color where a mask says: an alpha plane whose top left pixel is at (left, top). The
-// picture becomes one of 24 bits; one with alpha becomes as opaque as what is painted. Statuses as
-// PromotePicture.
+// Paints a color through a mask: an alpha plane with its top left pixel at (left, top). The
+// picture is converted to 24 bits; existing alpha increases with the opacity of the paint.
+// Statuses as PromotePicture.
 Status PaintThroughMask(PictureRecord& picture, const PackedImage& mask, int32_t left, int32_t top,
                         const Backdrop& color);
-// The same on an image of 24 bits that has no alpha.
+// As above, on a 24-bit image without alpha.
 void PaintThroughMask(PackedImage& image, const PackedImage& mask, int32_t left, int32_t top,
                       const Backdrop& color);
 
 // Paints a rectangle of one color; statuses as PaintThroughMask.
 Status PaintRectangle(PictureRecord& picture, const Rectangle& area, const Backdrop& color);
 
-// Lays a picture of 24 bits over another one, with its alpha plane where it has one, at (left,
-// top). Its own opacity is that of 255. Statuses as PaintThroughMask.
+// Composites a 24-bit picture, with its alpha plane if it has one, over another at (left, top). Its
+// alpha is scaled by opacity / 255. Statuses as PaintThroughMask.
 Status PaintPicture(PictureRecord& picture, const PictureRecord& above, int32_t left, int32_t top,
                     uint8_t opacity);
 
-// Covers a rectangle with copies of an opaque picture of 24 bits, side by side from the rectangle's
-// top left corner. Statuses as PaintThroughMask.
+// Tiles a rectangle with copies of an opaque 24-bit picture, starting at its top left corner.
+// Statuses as PaintThroughMask.
 Status PaintTiles(PictureRecord& picture, const PictureRecord& tile, const Rectangle& area);
 
 }  // namespace fotomill

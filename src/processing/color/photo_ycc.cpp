@@ -8,8 +8,8 @@ namespace fotomill {
 
 namespace {
 
-// Lights go to 346, white is 247. Those up to the knee are shown as they are, those above in what
-// is left up to 255, ever closer together.
+// Highlights go up to 346, white is 247. Values up to the knee are unchanged; those above are
+// compressed into the range up to 255.
 constexpr double kBrightest = 346, kKnee = 200, kScreen = 255;
 
 double Shown(double light) {
@@ -18,8 +18,8 @@ double Shown(double light) {
   return kScreen - (kScreen - kKnee) * std::pow(left, (kBrightest - kKnee) / (kScreen - kKnee));
 }
 
-// Sums of the parts below are in 32nds, with a half. They begin above kLowest, so that none is
-// negative, and end below kLights.
+// Sums of the terms below are in 32nds, plus one half. They are offset by kLowest, so that none is
+// negative, and stay below kLights.
 constexpr int32_t kFraction = 5;
 constexpr int32_t kLowest = -352, kLights = 1024;
 

@@ -9,7 +9,7 @@ namespace fotomill {
 
 namespace {
 
-constexpr int32_t kLeastRows = 16;  // of a band
+constexpr int32_t kLeastRows = 16;  // per band
 
 void ApplyTables(const std::array<ChannelTable, 3>& tables, uint8_t* bgr, size_t pixels) {
   if (tables[0] == tables[1] && tables[1] == tables[2]) {
@@ -24,7 +24,7 @@ void ApplyTables(const std::array<ChannelTable, 3>& tables, uint8_t* bgr, size_t
   }
 }
 
-// Effects with runs of tables merged into one table each.
+// The effects with adjacent tables merged.
 std::vector<PointEffect> Merged(std::span<const PointEffect> effects) {
   std::vector<PointEffect> merged;
   for (const PointEffect& effect : effects) {

@@ -12,9 +12,9 @@ void LookUp(const uint8_t* table, uint8_t* values, size_t count) {
 
 #if VECTOR_HAS_AVX2
 VECTOR_AVX2_BEGIN
-// A shuffle picks from sixteen entries, so a table is sixteen shuffles. Counted from the shuffle's
-// first entry, values that it does not serve are 16 or more; with 112 added they have the top bit,
-// for which a shuffle gives 0.
+// A shuffle looks up one of 16 entries, so the table takes 16 shuffles. Relative to a shuffle's
+// first entry, values it does not cover are 16 or more; adding 112 sets their top bit, for which a
+// shuffle returns 0.
 void LookUpAvx2(const uint8_t* table, uint8_t* values, size_t count) {
   constexpr size_t kAtOnce = 64;
   constexpr int kParts = 16;

@@ -5,10 +5,10 @@
 
 namespace fotomill {
 
-// Replaces each of `count` values by the entry that it selects in a table of 256 bytes.
+// Replaces each of `count` values by its entry in a table of 256 bytes.
 using TableRow = void (*)(const uint8_t* table, uint8_t* values, size_t count);
 
-// For this processor, and for any. Both give the same.
+// For this processor, and portable. The results are identical.
 TableRow TableRowHere();
 TableRow BaselineTableRow();
 

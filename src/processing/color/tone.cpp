@@ -10,8 +10,8 @@ namespace fotomill {
 
 namespace {
 
-// The slopes of a monotone curve at its knots. `steps` are those of the straight lines between
-// them.
+// Slopes of a monotone curve at its knots. `steps` are the slopes of the line
+// segments between them.
 std::vector<double> MonotoneSlopes(std::span<const double> steps) {
   std::vector<double> slopes(steps.size() + 1);
   slopes.front() = steps.front();
@@ -50,7 +50,7 @@ PointEffect BrightnessEffect(double b) {
 }
 
 PointEffect ContrastEffect(double c) {
-  // At 100 the tangent is beyond all bounds; a factor of 1000 parts black and white as well.
+  // At 100 the tangent is infinite; a factor of 1000 also separates black and white.
   const double k = c >= 100 ? 1000 : std::tan((c + 100) * std::numbers::pi / 400);
   return EffectOf([=](double v) { return (v - 127.5) * k + 127.5; });
 }

@@ -9,9 +9,9 @@ namespace fotomill {
 
 namespace {
 
-constexpr int32_t kLeastRows = 16;  // of a band
+constexpr int32_t kLeastRows = 16;  // per band
 
-// The square of a pixel's distance from the middle along one axis, 1/2 at the border.
+// The squared distance of a pixel from the center along one axis, 1/2 at the border.
 double SquareAcross(int32_t place, int32_t length) {
   const double across = (place + 0.5 - length / 2.0) / (length / 2.0);
   return across * across / 2;

@@ -10,20 +10,20 @@
 
 namespace fotomill {
 
-// Edges of a picture that fade into a color.
+// Fades the edges of a picture to a color.
 struct Vignette {
-  double amount = 0.5;  // share of the color in the corners, 0 to 1
-  // share of the way from the center to the corners that stays as it is, 0 to below 1
+  double amount = 0.5;  // opacity of the color in the corners, 0 to 1
+  // unaffected part of the radius, 0 to below 1
   double size = 0.4;
   BgrColor color{};
-  // The picture may be a part: the place of its pixel (0, 0) in the whole, and the whole's size.
+  // For a part of a picture: the position of its pixel (0, 0) in the whole, and the whole's size.
   int32_t left = 0, top = 0;
   Size whole{0, 0};
 };
 
-// With r the distance from the center, 1 in the corners of the picture measured as an ellipse, and
-// s = (r - size) / (1 - size) cut to 0 to 1, v becomes v + (color - v) amount s^2 (3 - 2 s). The
-// picture gets 24 bits; alpha stays. Statuses as NewPackedImage, and FunctionCancelled (4).
+// With r the elliptical distance from the center, 1 in the corners, and s = (r - size) / (1 - size)
+// clamped to 0 to 1, v becomes v + (color - v) amount s^2 (3 - 2 s). The picture is converted to 24
+// bits; alpha is unchanged. Statuses as NewPackedImage, and FunctionCancelled (4).
 Status ApplyVignette(PictureRecord& picture, const Vignette& vignette, const Work& work);
 
 }  // namespace fotomill

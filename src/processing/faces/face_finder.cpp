@@ -18,12 +18,12 @@ namespace fotomill {
 
 namespace {
 
-constexpr int32_t kWindow = 24;         // the edge of the smallest face that classifiers know
-constexpr int32_t kLongestEdge = 1600;  // of the picture that is searched
+constexpr int32_t kWindow = 24;         // minimum face size of the classifiers, pixels
+constexpr int32_t kLongestEdge = 1600;  // of the picture to search
 constexpr int32_t kMostFaces = 1000;
 constexpr unsigned kSeconds = 60;
 
-// Where modules of the program lie: beside it as it is built, or in the prefix it is installed in.
+// Modules are next to the program in a build tree, or in the installation prefix.
 std::string ModulePath() {
   const std::string program = platform::ProgramFolder();
   const std::string name = std::string("fotomill-faces") + platform::kModuleExtension;
@@ -35,7 +35,7 @@ std::string ModulePath() {
   return {};
 }
 
-// Empty when there is no such classifier.
+// Empty if there is no such classifier.
 std::string CascadePath(const std::string& cascade) {
   if (platform::IsRegularFile(cascade) && cascade.find('/') != std::string::npos)
     return platform::AbsolutePath(cascade);
@@ -49,26 +49,26 @@ std::string CascadePath(const std::string& cascade) {
   return {};
 }
 
-// What the process apart is told: this, and the paths of module and classifier behind it, each with
-// a zero byte. Input is the picture's gray samples, row by row from the top.
+// The request to the worker process, followed by the paths of module and classifier, each
+// NUL-terminated. The input is the picture's gray samples, row by row from the top.
 struct Request {
   int32_t width, height, smallest;
 };
 
-// What it stores: the number of faces, and the faces.
+// The reply: the number of faces, and the faces.
 struct Reply {
   int32_t count;
   FotomillFace faces[kMostFaces];
 };
 
-// The picture that is searched, and how much smaller it is than the real one.
+// The picture to search, and its scale relative to the original.
 struct Searched {
   std::vector<uint8_t> gray;
   int32_t width = 0, height = 0, smallest = kWindow;
   double scale = 1;
 };
 
-// No face may be lost by scaling: the smallest one that counts keeps the classifiers' own size.
+// The smallest relevant face is not scaled below the classifiers' minimum size.
 double ScaleFor(Size size, int32_t smallestPercent) {
   const double smallest = std::min(size.width, size.height) * smallestPercent / 100.0;
   const double byFace = smallest > kWindow ? kWindow / smallest : 1;
@@ -122,7 +122,7 @@ Status FindFaces(const PackedImage& image, const FaceOptions& options,
   if (module.empty() || cascade.empty()) return Status::FeatureDisabled;
   Searched searched;
   RETURN_IF_BAD(Prepare(image, options, searched));
-  // Classifiers know no smaller faces than their window.
+  // Classifiers cannot find faces smaller than their window.
   if (std::min(searched.width, searched.height) < kWindow) return Status::Ok;
 
   const Request head = {searched.width, searched.height, searched.smallest};
@@ -195,7 +195,7 @@ bool FindFacesApart(const platform::ApartCall& call) {
   if (find != nullptr)
     reply.count = find(call.input.data(), request.width, request.height, request.width,
                        cascade.c_str(), request.smallest, reply.faces, kMostFaces);
-  // The library's own threads and memory end with the process, not with it.
+  // Never unloaded: the library's threads and memory end with the process.
   static std::vector<platform::SharedLibrary> kept;
   kept.push_back(std::move(library));
   if (find == nullptr || reply.count < 0) return false;

@@ -12,30 +12,30 @@
 
 namespace fotomill {
 
-// Whether the detector and the classifier are installed. Nothing is loaded.
+// Whether detector and classifier are installed. Loads nothing.
 bool CanFindFaces(const FaceOptions& options);
 
-// Looks for upright faces, in a process of its own; `alpha` does not count. `faces` are within the
-// picture, the largest first. The detector is Viola and Jones's (CVPR 2001) as OpenCV has it.
-// FeatureDisabled (22) where it or the classifier is not installed, EmptyImage (31),
-// MemoryAllocationError (6), FunctionCancelled (4) when `goesOn` says no or the program is asked to
-// end.
+// Finds upright faces, in a worker process; alpha is ignored. `faces` are within the picture, the
+// largest first. Uses OpenCV's implementation of the Viola-Jones detector (CVPR 2001).
+// FeatureDisabled (22) if it or the classifier is not installed, EmptyImage (31),
+// MemoryAllocationError (6), FunctionCancelled (4) if `goesOn` returns false or the program is
+// asked to end.
 Status FindFaces(const PackedImage& image, const FaceOptions& options,
                  std::vector<Rectangle>& faces, const std::function<bool()>& goesOn = {});
 
-// The smallest rectangle around some faces, with room around it for hair and chin, within a
-// picture of that size. `faces` must not be empty.
+// The bounding box of some faces, with a margin for hair and chin, within a picture of that size.
+// `faces` must not be empty.
 Rectangle AroundFaces(const std::vector<Rectangle>& faces, int32_t width, int32_t height);
 
-// Cuts a picture down to its largest face, or to all of them with `all`, and the room around. A
-// picture without a face, or where no one can look for one, stays as it is. Statuses of CutPicture
-// and FunctionCancelled (4).
+// Crops a picture to its largest face, or with `all` to all of them, plus a margin. Pictures
+// without a face are unchanged, as are all pictures if detection is not available. Statuses of
+// CutPicture and FunctionCancelled (4).
 Status FrameOnFaces(PictureRecord& picture, const FaceOptions& options, bool all,
                     const std::function<bool()>& goesOn = {});
-// Pictures are decoded at least as large as this for it, where smaller ones would do otherwise.
+// Minimum decoding size for it, where smaller would otherwise do.
 inline constexpr int32_t kFramingSide = 512;
 
-// The part of the work that runs apart: a row of the program's table of such work.
+// The task for the worker process, a row of the program's task table.
 inline constexpr char kFacesTask[] = "find-faces";
 bool FindFacesApart(const platform::ApartCall& call);
 

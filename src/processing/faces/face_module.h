@@ -3,8 +3,8 @@
 #include <cstddef>
 #include <cstdint>
 
-// The boundary between the program and its face detector, a module that is loaded where a process
-// of its own looks for faces (modules/faces). The module knows only this header.
+// Interface between the program and its face detector, a module loaded only in a worker process
+// (modules/faces). The module depends on nothing else.
 
 extern "C" {
 
@@ -13,10 +13,10 @@ struct FotomillFace {
   int32_t x, y, width, height;
 };
 
-// Looks for faces in a picture of 8-bit gray samples, rows from the top and `stride` bytes apart.
-// `cascade` is the path of the trained classifier (OpenCV's XML); `smallest` the edge of the
-// smallest face that counts, in pixels. At most `most` faces are stored. Returns their number, or
-// kFotomillNoCascade.
+// Finds faces in a picture of 8-bit gray samples, top row first, rows
+// `stride` bytes apart. `cascade` is the path of the trained classifier
+// (OpenCV's XML); `smallest` the minimum face size in pixels. At most
+// `most` faces are stored. Returns their number, or kFotomillNoCascade.
 using FotomillFindFaces = int32_t(const uint8_t* gray, int32_t width, int32_t height,
                                   ptrdiff_t stride, const char* cascade, int32_t smallest,
                                   FotomillFace* faces, int32_t most);

@@ -5,11 +5,11 @@
 
 namespace fotomill {
 
-// How faces are looked for.
+// Options for finding faces.
 struct FaceOptions {
-  // The trained classifier: a path, or the name of one of those that come with OpenCV.
+  // The trained classifier: a path, or the name of one from OpenCV.
   std::string cascade = "haarcascade_frontalface_alt.xml";
-  int32_t smallestPercent = 2;  // the smallest face that counts, in percent of the shorter edge
+  int32_t smallestPercent = 2;  // minimum face size, in percent of the shorter edge
 
   bool operator==(const FaceOptions&) const = default;
 };

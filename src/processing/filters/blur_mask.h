@@ -6,8 +6,8 @@
 
 namespace fotomill {
 
-// Blurs an alpha plane by a Gaussian, for the soft edges of shadows; a sigma below 0.1 changes
-// nothing. Statuses as BlurPicture; on failure the plane may be empty.
+// Applies a Gaussian blur to an alpha plane, for soft shadows; a sigma below 0.1 is a no-op.
+// Statuses as BlurPicture; on failure the plane may be empty.
 Status BlurMask(PackedImage& mask, double sigma, const Work& work);
 
 }  // namespace fotomill

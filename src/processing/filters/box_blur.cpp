@@ -9,12 +9,11 @@ namespace fotomill {
 
 namespace {
 
-constexpr int32_t kLeastRows = 64;  // of a band: its first row costs as much as a window is high
+constexpr int32_t kLeastRows = 64;  // per band: its first row costs as much as the window height
 constexpr size_t kChannels = 4;     // blue, green, red times alpha, and alpha
 
-// Numbers divided by a constant and rounded to nearest. Exact for numbers below 2^24 and odd
-// constants below 2^16: what rounding the inverse up adds is less than 2^-16, the least distance to
-// the next whole number.
+// Division by a constant, rounded to nearest. Exact for dividends below 2^24 and odd divisors below
+// 2^16: rounding up the reciprocal adds less than 2^-16, the minimum distance to the next integer.
 class Divider {
  public:
   explicit Divider(uint32_t by) : half_(by / 2), inverse_(((uint64_t{1} << 40) + by - 1) / by) {}
@@ -28,13 +27,13 @@ class Divider {
 
 struct BoxBlur {
   const PackedImage& image;
-  const PackedImage* alpha;  // null without one
+  const PackedImage* alpha;  // null if none
   int32_t radius;
-  size_t samples = 0;  // of a row
+  size_t samples = 0;  // per row
 
   int32_t Inside(int32_t y) const { return std::clamp(y, 0, image.Height() - 1); }
 
-  // Adds a row of the source to the sums of columns, or takes it off them.
+  // Adds a source row to the column sums, or subtracts it.
   template <bool subtract>
   void Gather(int32_t y, std::span<uint32_t> sums) const {
     const uint8_t* bgr = image.Row(Inside(y)).data();
@@ -50,7 +49,7 @@ struct BoxBlur {
     }
   }
 
-  // The sums of windows along a row, from those of columns.
+  // Window sums along a row, from column sums.
   template <size_t channels, typename Put>
   void Along(std::span<const uint32_t> sums, Put put) const {
     const int32_t last = image.Width() - 1;

@@ -34,7 +34,7 @@ struct Gradient {
   }
 };
 
-// A sum in 1 / 65536 of a direction, so that it is the same everywhere.
+// Fixed point, 1 / 65536, so that results are the same on every machine.
 int64_t DirectionOf(double value) { return std::llround(value * 65536); }
 
 }  // namespace

@@ -17,12 +17,12 @@ namespace fotomill {
 namespace {
 
 constexpr double kCut = 4;          // sigmas
-constexpr double kGrid = 0.7;       // distance of the coarse grid, in sigmas
-constexpr int32_t kMostShift = 15;  // precision of weights: sums of samples stay below 2^31
-constexpr size_t kSpare = 8;        // samples that a pass may write behind a row's end
-// samples that a pass may read behind a row's end, with a weight of 0
+constexpr double kGrid = 0.7;       // spacing of the coarse grid, in sigmas
+constexpr int32_t kMostShift = 15;  // precision of weights: keeps sums of samples below 2^31
+constexpr size_t kSpare = 8;        // samples that a pass may write past the end of a row
+// samples that a pass may read past the end of a row, with weight 0
 constexpr size_t kReadAhead = 64;
-constexpr int32_t kLeastRows = 32;  // of a band
+constexpr int32_t kLeastRows = 32;  // per band
 constexpr int32_t kOpaque = 255 << kFraction;
 
 constexpr int32_t RoundUp(int32_t number, int32_t group) {
@@ -32,12 +32,12 @@ constexpr size_t RoundUp(size_t number, size_t group) {
   return (number + group - 1) / group * group;
 }
 
-// The weights of a Gaussian at whole numbers around `center`, out to 4 sigma, as shares of 1.
+// The weights of a Gaussian at integer positions around `center`, out to 4 sigma, normalized to 1.
 struct Shares {
-  int32_t first = 0;  // the number that the first weight belongs to
+  int32_t first = 0;  // position of the first weight
   std::vector<double> shares;
 
-  // `step` is the distance between neighboring numbers.
+  // `step` is the distance between adjacent positions.
   Shares(double center, double sigma, double step) {
     first = static_cast<int32_t>(std::ceil((center - kCut * sigma) / step));
     const auto last =
@@ -51,8 +51,8 @@ struct Shares {
   }
 };
 
-// Several sets of weights, rounded to shares of 2^shift that add up exactly, each filled up with
-// zeros.
+// Several sets of weights, rounded to integers that add up to exactly 2^shift, each
+// padded with zeros.
 class WeightSets {
  public:
   void Make(const std::vector<Shares>& sets) {
@@ -82,9 +82,9 @@ class WeightSets {
     }
   }
   int32_t Taps() const { return taps_; }
-  int32_t Longest() const { return longest_; }  // taps without the zeros
+  int32_t Longest() const { return longest_; }  // taps without the padding
   int32_t Shift() const { return shift_; }
-  // The window of set `s`, moved by `move` numbers.
+  // The window of set `s`, shifted by `move` positions.
   FilterWindow Window(size_t s, int32_t move) const {
     return {firsts_[s] + move, taps_, weights_.data() + s * static_cast<size_t>(taps_)};
   }
@@ -95,13 +95,13 @@ class WeightSets {
   int32_t taps_ = 0, longest_ = 0, shift_ = 0;
 };
 
-// One edge of the picture: its pixels, and the cells of the coarse grid. Cell g has its center at
-// (g + 1/2) d - 1/2, counted in pixels of the whole picture.
+// One axis of the picture: its pixels, and the cells of the coarse grid. Cell g is centered at (g +
+// 1/2) d - 1/2, in pixels of the whole picture.
 struct Axis {
-  int32_t count = 0, offset = 0;      // pixels, and the place of the first one in the whole picture
-  int32_t grid = 1;                   // d; 1: pixels are blurred at once, without cells
-  int32_t firstCell = 0, cells = 0;   // that the pixels need
-  // pixels to a cell; cells to a pixel, a set for each place within a cell
+  int32_t count = 0, offset = 0;      // pixels, and position of the first one in the whole picture
+  int32_t grid = 1;                   // d; 1: pixels are blurred directly, without cells
+  int32_t firstCell = 0, cells = 0;   // the cells that the pixels use
+  // from pixels to a cell; from cells to a pixel, one set for each position within a cell
   WeightSets down, up;
 
   void Make(int32_t pixels, int32_t place, double sigma) {
@@ -119,7 +119,7 @@ struct Axis {
     for (int32_t p = 0; p < grid; ++p) phases.emplace_back(p - middle, half, grid);
     up.Make(phases);
     firstCell = CellsOf(0).first;
-    // those behind, which have no weight, are not computed: their pixels may be far outside
+    // the padding beyond is not computed: its pixels may be far outside
     cells = 0;
     for (int32_t x = std::max(0, count - grid); x < count; ++x)
       cells = std::max(cells, CellsOf(x).first + up.Longest() - firstCell);
@@ -128,7 +128,7 @@ struct Axis {
       firstCell = std::min(firstCell, CellsOf(x).first);
     cells += least - firstCell;
   }
-  // The pixels of a cell, or around pixel i; counted from the first pixel.
+  // The pixels of a cell, or around pixel i; relative to the first pixel.
   FilterWindow PixelsOf(int32_t i) const {
     return down.Window(0, grid == 1 ? i : i * grid - offset);
   }
@@ -139,14 +139,14 @@ struct Axis {
   }
 };
 
-// What all bands share.
+// Shared by all bands.
 struct GaussianPlan {
   const PackedImage* image = nullptr;
-  const PackedImage* alpha = nullptr;  // null without one
+  const PackedImage* alpha = nullptr;  // null if none
   size_t channels = 3, samples = 0;
   Axis across, down;
-  int32_t padding = 0;  // pixels that repeat the edge on either side of a row
-  std::vector<FilterWindow> toCells, toPixels;  // along a row; `toPixels` is empty without a grid
+  int32_t padding = 0;  // edge pixels repeated on both sides of a row
+  std::vector<FilterWindow> toCells, toPixels;  // horizontal; `toPixels` is empty without a grid
 
   void Make(const PictureRecord& picture, double sigma, const GaussianPlace& place) {
     image = &picture.image;
@@ -172,7 +172,7 @@ struct GaussianPlan {
   }
 };
 
-// A band of blurred rows, as samples.
+// Computes the blurred rows of a band, as samples.
 class GaussianRows {
  public:
   Status Open(const GaussianPlan& plan) {
@@ -191,10 +191,10 @@ class GaussianRows {
     return room ? Status::Ok : Status::MemoryAllocationError;
   }
 
-  // How many samples a row of `Row` must have room for.
+  // Samples in a buffer for `Row`.
   size_t Stride() const { return stride_; }
 
-  // Row y; rows are asked for in order.
+  // Row y; must be called in ascending order.
   void Row(int32_t y, int16_t* row) {
     if (plan_->down.grid == 1) return BlurSource(y, row);
     const FilterWindow window = plan_->down.CellsOf(y);
@@ -212,7 +212,7 @@ class GaussianRows {
     return ring_.Items<int16_t>().data() + static_cast<size_t>(slot) * stride_;
   }
 
-  // Weighs the source rows of a cell, or around a row, and blurs the result along the row.
+  // Sums up weighted source rows for a cell, or around a row, and blurs the result horizontally.
   void BlurSource(int32_t cell, int16_t* row) {
     int16_t* padded = padded_.Items<int16_t>().data();
     const size_t channels = plan_->channels,
@@ -268,7 +268,7 @@ class GaussianRows {
   platform::MemoryBlock padded_, cells_, ring_, rows_, sums_, pointers_;
 };
 
-// Divides colors by their alpha. A pixel that nothing is seen of is black.
+// Divides colors by their alpha. Fully transparent pixels become black.
 void SplitAlpha(const int16_t* samples, int32_t width, uint8_t* bgr, uint8_t* alpha) {
   for (int32_t x = 0; x < width; ++x, samples += 4, bgr += 3) {
     const int32_t level = std::clamp((samples[3] + (1 << (kFraction - 1))) >> kFraction, 0, 255);
@@ -281,10 +281,10 @@ void SplitAlpha(const int16_t* samples, int32_t width, uint8_t* bgr, uint8_t* al
   }
 }
 
-// Turns a row of blurred samples into what the result has there; `y` is its row in the picture.
+// Converts a row of blurred samples to the result; `y` is its row in the picture.
 using FinishRow = std::function<void(int32_t y, int16_t* samples)>;
 
-// Replaces the rows of a picture by ones computed from blurred rows.
+// Replaces the rows of a picture with ones computed from blurred rows.
 Status FilterPicture(PictureRecord& picture, double sigma, const GaussianPlace& place,
                      const Work& work, const FinishRow& finish) {
   if (picture.image.Empty()) return Status::EmptyImage;
@@ -322,7 +322,7 @@ Status FilterPicture(PictureRecord& picture, double sigma, const GaussianPlace& 
 }  // namespace
 
 int32_t GaussianReach(double sigma) {
-  // Both steps, and a cell more for each.
+  // Both passes, plus one cell for each.
   const auto grid = std::max(1, static_cast<int32_t>(kGrid * sigma));
   const double reach = grid == 1 ? kCut * sigma : kCut * sigma * std::numbers::sqrt2 + grid;
   return static_cast<int32_t>(std::ceil(reach)) + 1;

@@ -40,7 +40,7 @@ void AverageBlock(PictureRecord& picture, const Rectangle& block) {
   }
 }
 
-// Sums of the pixels of a window by the range that their luma is in.
+// Sums of a window's pixels, by luma range.
 struct Ranges {
   struct Sum {
     uint32_t weight, blue, green, red;
@@ -71,7 +71,7 @@ struct OilBand {
   int32_t radius;
   bool hasAlpha;
 
-  // Adds a column to the window of row y, or takes it off; sums go around zero and come back.
+  // Adds a column to the window of row y, or subtracts it; unsigned wraparound cancels out.
   template <bool subtract>
   void Column(int32_t x, int32_t y) {
     for (int32_t j = y - radius; j <= y + radius; ++j) {
@@ -100,15 +100,15 @@ struct OilBand {
   }
 };
 
-// Where the eyes are in what the detector takes for a face, in per cent of its height.
+// Position of the eyes within a detected face, in percent of its height.
 constexpr int64_t kEyesFrom = 15, kEyesTo = 60;
 
 struct Point {
   int32_t x, y;
 };
 
-// Takes the marked pixels that hang together with the one at `start` off the mask. Whether they are
-// a compact spot: no side longer than `widest` or twice the other, and half of it filled.
+// Removes the connected marked pixels around `start` from the mask. Returns whether they form a
+// compact spot: no side longer than `widest` or twice the other, and at least half filled.
 bool TakeSpot(PackedImage& mask, int32_t width, int32_t height, Point start, int32_t widest,
               std::vector<Point>& spot) {
   spot.assign(1, start);

@@ -15,19 +15,19 @@ namespace fotomill {
 namespace {
 
 constexpr int32_t kLeastRows = 32;
-constexpr uint32_t kWhole = 65536;  // what weights add up to
+constexpr uint32_t kWhole = 65536;  // sum of the weights
 
 struct Tap {
   int32_t dx, dy;
   uint32_t weight;
 };
 
-// The pixels that the points of a line fall on, and how much each counts.
+// The pixels covered by the points of a line, with their weights.
 std::vector<Tap> TapsOf(double length, double angle) {
   const double turn = angle * std::numbers::pi / 180;
   const auto points = std::max<int32_t>(1, static_cast<int32_t>(std::lround(length)));
   std::map<std::pair<int32_t, int32_t>, double> weights;
-  // To 1 / 4096 of a pixel: a place that a rounding error moves stays the same.
+  // Rounded to 1 / 4096 of a pixel, so that rounding errors do not matter.
   const auto place = [&](double way) { return std::floor(way * 4096 + 0.5) / 4096; };
   for (int32_t i = 0; i < points; ++i) {
     const double way = i - (points - 1) / 2.0;
@@ -51,7 +51,7 @@ std::vector<Tap> TapsOf(double length, double angle) {
   return taps;
 }
 
-// The sums of a row: blue, green, red, or each times alpha, and alpha.
+// Row sums: blue, green, red, or each times alpha, and alpha.
 struct MotionBand {
   PaddedRows colors, alpha;
   std::vector<uint32_t> sums;
@@ -79,14 +79,14 @@ void PutAlphaPixel(const uint64_t (&sums)[4], uint64_t whole, uint8_t* bgr, uint
   opacity = static_cast<uint8_t>((sums[3] + whole / 2) / whole);
 }
 
-// Where a point of a radial blur is, seen from the center, from where the pixel is: x' = c x - s y,
-// y' = s x + c y.
+// Rotation or scaling for a point of a radial blur, relative to the center: x' = c x - s y, y' = s
+// x + c y.
 struct Turned {
   double c, s;
 };
 constexpr int32_t kMostPoints = 64;
-constexpr size_t kFewPoints = 8;  // of so many, each shows, and is interpolated
-using Points = std::vector<std::vector<Turned>>;  // by how many there are
+constexpr size_t kFewPoints = 8;  // up to this many are interpolated, as each one shows
+using Points = std::vector<std::vector<Turned>>;  // indexed by the number of points
 
 Points PointsOf(RadialKind kind, double amount) {
   Points points(kMostPoints + 1);
@@ -94,7 +94,7 @@ Points PointsOf(RadialKind kind, double amount) {
     for (int32_t i = 0; i < count; ++i) {
       const double share = (i + 0.5) / count - 0.5;
       const double turn = amount * share * std::numbers::pi / 180;
-      // To 2^-24, so that they are the same everywhere.
+      // Rounded to 2^-24, so that results are the same on every machine.
       const auto exact = [](double v) { return std::floor(v * 16777216 + 0.5) / 16777216; };
       points[static_cast<size_t>(count)].push_back(
           kind == RadialKind::Spin ? Turned{exact(std::cos(turn)), exact(std::sin(turn))}
@@ -108,9 +108,9 @@ struct Radial {
   const PackedImage& image;
   const PackedImage* alpha;
   const Points& points;
-  double perPixel, centerX, centerY;  // points a pixel of distance
+  double perPixel, centerX, centerY;  // points per pixel of distance
 
-  // Adds the four pixels around a place, in 1 / 256.
+  // Adds the four pixels around a position, weighted in 1 / 256.
   void Add(double x, double y, uint64_t (&sums)[4]) const {
     const int32_t right = image.Width() - 1, bottom = image.Height() - 1;
     const auto fixedX = static_cast<int64_t>(
@@ -134,7 +134,7 @@ struct Radial {
     pixel(column + 1, row + 1, partX * partY);
   }
 
-  // Adds the pixel that a place is nearest to.
+  // Adds the pixel nearest to a position.
   void AddNearest(double x, double y, uint64_t (&sums)[4]) const {
     const int32_t right = image.Width() - 1, bottom = image.Height() - 1;
     const auto column = static_cast<size_t>(std::clamp(x, 0.0, static_cast<double>(right)) + 0.5);
@@ -167,7 +167,7 @@ struct Radial {
   }
 };
 
-// Makes the new images of a blur, lets `band` fill their rows, and moves them in.
+// Creates the result images of a blur, has `band` fill their rows, and stores them in the picture.
 template <typename Band>
 Status Replace(PictureRecord& picture, int32_t leastRows, const Work& work, Band band) {
   const int32_t width = picture.image.Width(), height = picture.image.Height();

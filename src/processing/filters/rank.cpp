@@ -12,10 +12,10 @@ namespace fotomill {
 
 namespace {
 
-// columns whose histograms are in the processor's cache together
+// columns whose histograms fit in the processor's cache
 constexpr int32_t kMedianTile = 128;
 constexpr int32_t kExtremeTile = 1024;
-constexpr int32_t kLeastRows = 64;     // of a band: its first row costs as much as a window is high
+constexpr int32_t kLeastRows = 64;     // per band: its first row costs as much as the window height
 
 size_t Channels(const PackedImage& image) { return image.Bits() == 24 ? 3 : 1; }
 
@@ -24,9 +24,9 @@ struct Tile {
   int32_t left, right, first, end;
 };
 
-// Histograms of the columns under a row of windows of one tile, all channels.
-// Source: S. Perreault and P. Hebert, "Median Filtering in Constant Time", IEEE Transactions on
-// Image Processing 16 (2007).
+// Histograms of the columns below a row of windows in one tile, for all channels. Source: S.
+// Perreault and P. Hebert, "Median Filtering in Constant Time", IEEE Transactions on Image
+// Processing 16 (2007).
 class ColumnHistograms {
  public:
   ColumnHistograms(const PackedImage& source, int32_t radius)
@@ -46,7 +46,7 @@ class ColumnHistograms {
     return Status::Ok;
   }
 
-  // Goes from row y - 1 to row y.
+  // Advances from row y - 1 to row y.
   void MoveTo(int32_t y) {
     const uint8_t *gone = Row(y - radius_ - 1), *come = Row(y + radius_);
     if (gone == come) return;
@@ -85,7 +85,7 @@ class ColumnHistograms {
   const PackedImage& source_;
   const int32_t radius_;
   const size_t channels_;
-  // of the tile and `radius` columns on either side: where in a row each is
+  // offset in a row of each column of the tile, including `radius` columns on either side
   std::vector<uint32_t> samples_;
   size_t groupStride_ = 0;
   platform::MemoryBlock counts_;  // groups, then levels group by group
@@ -114,9 +114,9 @@ struct Greatest {
   static uint8_t Of(uint8_t a, uint8_t b) { return std::max(a, b); }
 };
 
-// Each sample becomes the extreme of itself and the `window` - 1 samples that follow it in steps of
-// `step`. `count` samples have all of them. What two windows side by side have found is combined,
-// so that windows double.
+// Replaces each sample by the extreme of itself and the next `window` - 1 samples, `step` apart.
+// All of these must exist for `count` samples. Combines the results of adjacent windows, doubling
+// the window each time.
 template <typename Extreme>
 void ExtremesAhead(uint8_t* samples, size_t count, size_t window, size_t step) {
   const auto combine = [&](size_t away, size_t needed) {
@@ -160,7 +160,7 @@ Status ExtremeTile(const PackedImage& source, int32_t radius, const Tile& tile,
   return Status::Ok;
 }
 
-// Ranks one image of 24 bits, or an alpha plane, into a new one.
+// Filters a 24-bit image or an alpha plane into a new one.
 Status RankImage(const PackedImage& source, Rank rank, int32_t radius, const Work& work,
                  PackedImage& target) {
   const auto rankTile = rank == Rank::Median    ? MedianTile
@@ -178,7 +178,7 @@ Status RankImage(const PackedImage& source, Rank rank, int32_t radius, const Wor
       });
 }
 
-// Multiplies colors by alpha, or divides them by it again.
+// Multiplies colors by alpha, or divides them by it.
 template <bool divide>
 void WeighColors(PackedImage& image, const PackedImage& alpha) {
   for (int32_t y = 0; y < image.Height(); ++y) {

@@ -8,16 +8,16 @@
 
 namespace fotomill {
 
-// The smallest, the middle or the largest of the samples in the square of 2 radius + 1 pixels
-// around each pixel, channel by channel. The edge repeats. Colors and alpha are ranked with the
-// colors multiplied by alpha, so that the colors of transparent pixels do not show.
+// Rank filters: the minimum, median or maximum of the samples in the square of 2 radius + 1 pixels
+// around each pixel, per channel. The edge is repeated. Works on premultiplied colors, so that the
+// colors of transparent pixels do not show.
 enum class Rank : uint8_t { Minimum, Median, Maximum };
 
 // So that the pixels of a window can be counted in 16 bits.
 inline constexpr int32_t kMostRankRadius = 127;
 
-// Replaces the picture; the result has 24 bits. Radius 0 to kMostRankRadius. The cost of a median
-// does not depend on the radius, that of the others grows with its logarithm. Statuses: EmptyImage,
+// Replaces the picture; the result has 24 bits. Radius 0 to kMostRankRadius. The time for a median
+// does not depend on the radius, for the others it is logarithmic. Statuses: EmptyImage,
 // MemoryAllocationError, FunctionCancelled; the picture is then unchanged, or promoted.
 Status RankPicture(PictureRecord& picture, Rank rank, int32_t radius, const Work& work);
 

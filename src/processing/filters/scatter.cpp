@@ -18,8 +18,8 @@ uint64_t Mixed(uint64_t bits) {
   return bits ^ bits >> 31;
 }
 
-// The eight bytes of a random number add up to 1020 on average, with a variance of 8 (256^2 - 1)
-// / 12.
+// Approximates a normal distribution: the sum of eight random bytes averages 1020, with a variance
+// of 8 (256^2 - 1) / 12.
 constexpr int32_t kMeanOfBytes = 1020;
 const double kDeviationOfBytes = std::sqrt(8 * 65535 / 12.0);
 
@@ -29,7 +29,7 @@ int32_t SumOfBytes(uint64_t bits) {
   return sum;
 }
 
-// By how much a level changes, in 1 / 65536, for each step of a random number.
+// Change of a level, in 1 / 65536, per unit of a random number.
 struct Deviation {
   NoiseKind kind;
   int64_t step;
@@ -97,7 +97,7 @@ Status SpreadPicture(PictureRecord& picture, int32_t radius, uint32_t seed, int3
   RETURN_IF_BAD(NewPackedImage(width, height, nullptr, 24, image));
   if (!picture.alpha.Empty()) RETURN_IF_BAD(NewAlphaPlane(width, height, alpha));
   const auto choices = static_cast<uint64_t>(2 * radius + 1);
-  // 32 random bits to one of the choices.
+  // Maps 32 random bits to one of the choices.
   const auto way = [&](uint64_t bits) {
     return static_cast<int32_t>((bits & 0xffffffff) * choices >> 32) - radius;
   };

@@ -8,18 +8,18 @@
 
 namespace fotomill {
 
-// Effects of chance. What becomes of a pixel depends on the seed and its place alone, so neither
-// threads nor the part of a picture that is computed matter. `left`, `top`: the place of the
-// picture in the whole. Statuses: EmptyImage, MemoryAllocationError, FunctionCancelled.
+// Random effects. The result for a pixel depends only on the seed and its position, so that neither
+// threads nor tiling affect it. `left`, `top`: position of the picture in the whole. Statuses:
+// EmptyImage, MemoryAllocationError, FunctionCancelled.
 
-// 64 random bits for a place. Source: G. Steele, D. Lea and C. Flood, "Fast Splittable Pseudorandom
-// Number Generators" (2014).
+// 64 random bits for a position. Source: G. Steele, D. Lea and C. Flood, "Fast Splittable
+// Pseudorandom Number Generators" (2014).
 uint64_t RandomAt(uint64_t seed, int32_t x, int32_t y);
 
 enum class NoiseKind : int32_t {
-  Uniform,     // levels change by at most `amount` per cent of 255
-  Gaussian,    // by numbers whose standard deviation is `amount` per cent of 255
-  SaltPepper,  // `amount` per cent of the pixels become black or white
+  Uniform,     // levels change by at most `amount` percent of 255
+  Gaussian,    // normally distributed, with a standard deviation of `amount` percent of 255
+  SaltPepper,  // `amount` percent of the pixels become black or white
 };
 struct NoiseOptions {
   NoiseKind kind = NoiseKind::Gaussian;
@@ -28,12 +28,12 @@ struct NoiseOptions {
   uint32_t seed = 1;
   int32_t left = 0, top = 0;
 };
-// Changes the picture in place, row by row; alpha stays. After FunctionCancelled some rows are
-// changed.
+// In place, row by row; alpha is unchanged.
+// FunctionCancelled leaves some rows changed.
 Status AddNoise(PictureRecord& picture, const NoiseOptions& options, const Work& work);
 
-// Each pixel becomes one that is at most `radius` away along both edges, alpha included; edges
-// repeat.
+// Replaces each pixel, including alpha, by a random one at most `radius` away in each direction;
+// edges are repeated.
 Status SpreadPicture(PictureRecord& picture, int32_t radius, uint32_t seed, int32_t left,
                      int32_t top, const Work& work);
 

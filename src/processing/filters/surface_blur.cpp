@@ -48,7 +48,7 @@ Status DespecklePicture(PictureRecord& picture, int32_t radius, int32_t threshol
     uint8_t* bgr = picture.image.Row(y).data();
     const uint8_t* middle = median.image.Row(y).data();
     for (int32_t x = 0; x < width; ++x, bgr += 3, middle += 3) {
-      // its color is nobody's
+      // the color of transparent pixels is undefined
       if (hasAlpha && median.alpha.Row(y)[static_cast<size_t>(x)] == 0) continue;
       const int32_t far = std::max({std::abs(bgr[0] - middle[0]), std::abs(bgr[1] - middle[1]),
                                     std::abs(bgr[2] - middle[2])});

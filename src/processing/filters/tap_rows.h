@@ -11,17 +11,17 @@
 
 namespace fotomill {
 
-// What filters see that weigh the neighbors of a pixel one after the other: for a row of pixels,
-// the row of their neighbors at a distance. Edges repeat. A neighbor counts by its alpha, and for
-// what is missing the pixel counts itself, so that the hidden colors of transparent pixels do not
-// come out. One object a band.
+// The input of filters that add up weighted neighbors one at a time: for a
+// row of pixels, the row of their neighbors at an offset. Edges are
+// repeated. Neighbors are blended by their alpha with the pixel itself, so
+// that the colors of transparent pixels do not bleed. One object per band.
 class TapRows {
  public:
-  // Statuses as PaddedRows. The picture has 24 bits and stays as it is.
+  // Statuses as PaddedRows. The picture must have 24 bits and is not changed.
   Status Open(const PictureRecord& picture, int32_t reach);
   void MoveTo(int32_t y) { y_ = y; }
-  // Blue, green, red of the neighbors (dx, dy) pixels to the right and below, at most `reach`. Good
-  // until the next call.
+  // Blue, green, red of the neighbors at offset (dx, dy), at most `reach`. Valid until
+  // the next call.
   const uint8_t* At(int32_t dx, int32_t dy);
   // The row itself.
   const uint8_t* Own() { return colors_.Row(y_); }
@@ -34,7 +34,7 @@ class TapRows {
 };
 
 // Replaces the pixels of a picture row by row: `row(taps, out)` writes blue, green, red of one row.
-// Alpha stays. The picture is brought to 24 bits first. Statuses: EmptyImage,
+// Alpha is unchanged. The picture is converted to 24 bits first. Statuses: EmptyImage,
 // MemoryAllocationError, FunctionCancelled; the colors are unchanged then.
 Status FilterRows(PictureRecord& picture, int32_t reach, const Work& work,
                   const std::function<void(TapRows& taps, uint8_t* out)>& row);

@@ -14,7 +14,7 @@ namespace fotomill {
 
 namespace {
 
-// Makes an image of `size` from one of the same depth, row by row: `fill(y, row)` writes row y.
+// Creates an image of `size` from one of the same depth, row by row: `fill(y, row)` writes row y.
 // Both have whole bytes per pixel; images of less than 8 bits are unpacked and packed again.
 template <typename Fill>
 Status RemakeImage(PackedImage& image, Size size, Fill fill) {
@@ -55,7 +55,7 @@ Status PlaceImage(PackedImage& image, Size size, int32_t x, int32_t y,
   });
 }
 
-// An entry of a palette picture for a color: one that has it, else one that no pixel uses.
+// A palette entry for a color: an equal one, else an unused one.
 std::optional<int32_t> EntryFor(PictureRecord& picture, const Backdrop& backdrop) {
   PackedImage& image = picture.image;
   const auto table = image.ColorTable();
@@ -63,7 +63,7 @@ std::optional<int32_t> EntryFor(PictureRecord& picture, const Backdrop& backdrop
   for (int32_t i = 0; i < image.Colors(); ++i) {
     if (std::memcmp(table.data() + 4 * i, bgr.data(), 3) == 0) return i;
   }
-  if (backdrop.alpha == 0) return 0;  // no one sees its color
+  if (backdrop.alpha == 0) return 0;  // invisible, so any color will do
   std::bitset<256> used;
   for (int32_t y = 0; y < image.Height(); ++y) {
     for (int32_t x = 0; x < image.Width(); ++x) used.set(static_cast<size_t>(image.PixelAt(x, y)));
@@ -86,8 +86,7 @@ void TakeSize(PictureRecord& picture) {
   picture.bitsPerPixel = picture.image.Bits();
 }
 
-// The pixels of a row before `end` that are not the background, counted from the left; `end` when
-// there are none.
+// The first column before `end` that is not background; `end` if there is none.
 template <typename IsOther>
 int32_t FirstOther(int32_t end, IsOther isOther) {
   for (int32_t x = 0; x < end; ++x) {

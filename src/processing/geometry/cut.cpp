@@ -7,8 +7,8 @@ namespace fotomill {
 
 namespace {
 
-// Copies `bits` bits from bit `from` of a row on to the start of another, the most significant bit
-// of a byte first. The last byte is filled up with zeros.
+// Copies `bits` bits, from bit `from` of a row to the start of another, most significant bit first.
+// The last byte is padded with zeros.
 void CopyBits(std::span<const uint8_t> row, size_t from, size_t bits, uint8_t* copy) {
   const size_t shift = from % 8;
   const size_t bytes = (bits + 7) / 8;

@@ -8,8 +8,8 @@ namespace fotomill {
 
 namespace {
 
-// Sines of whole turns by interpolation in a table of exact numbers: the same on every processor,
-// and within 1e-6.
+// Sine by interpolation in a table of exact numbers, with angles in full turns: the same on every
+// processor, and accurate to 1e-6.
 class Sines {
  public:
   static const Sines& Shared() {
@@ -34,13 +34,13 @@ class Sines {
   std::array<double, kEntries + 2> table_;
 };
 
-// Fills a row of places from how far away each pixel of the whole comes from: `way(x, y)` gives
-// pixels to the right and down.
+// Computes a row of source positions from displacements: `way(x, y)` returns pixels to the right
+// and down.
 template <typename Way>
 PlaceRow Moved(const WarpOrigin& origin, Way way) {
   return [=](int32_t left, int32_t y, std::span<SourcePlace> places) {
     for (SourcePlace& place : places) {
-      // The way is rounded by itself, so that a part gets the same.
+      // The displacement is rounded separately, so that tiles match the whole.
       place = way(static_cast<double>(left) + origin.left, static_cast<double>(y) + origin.top);
       place.x += static_cast<int64_t>(left++) << kPlaceBits;
       place.y += static_cast<int64_t>(y) << kPlaceBits;

@@ -37,7 +37,7 @@ double Mitchell(double x) {
 
 struct FilterShape {
   double (*value)(double);
-  double support;  // source pixels on each side, where nothing shrinks
+  double support;  // filter radius in source pixels, unless shrinking
 };
 
 constexpr FilterShape ShapeOf(ScaleFilter filter) {
@@ -50,12 +50,12 @@ constexpr FilterShape ShapeOf(ScaleFilter filter) {
   }
 }
 
-// Where windows lie and what they weigh, before rounding.
+// Positions and weights of the windows, before rounding.
 struct Plan {
   FilterShape shape;
   SourceEdge edge;
-  double scale;  // source pixels a step
-  double widen;  // how much wider than its shape the filter is
+  double scale;  // source pixels per output pixel
+  double widen;  // factor by which the filter is widened
 
   double Center(int32_t i) const { return edge.begin + (i + 0.5) * scale; }
   int32_t First(int32_t i) const {
@@ -66,19 +66,19 @@ struct Plan {
     return std::clamp(static_cast<int32_t>(std::floor(Center(i) + shape.support * widen + 0.5)),
                       First(i) + 1, edge.count);
   }
-  // The shares of the source pixels of window i, which add up to 1.
+  // The weights of the source pixels in window i, normalized to 1.
   void Shares(int32_t i, double* shares) const {
     const int32_t first = First(i), taps = End(i) - first;
     double sum = 0;
-    // Where a pixel is exactly on a box's border, the order of these sums decides: it is that of
-    // the peers.
+    // For pixels exactly on a box's border, the summation order matters; it is the same as
+    // in other libraries.
     for (int32_t t = 0; t < taps; ++t)
       sum += shares[t] = shape.value((t + first - Center(i) + 0.5) * (1 / widen));
     for (int32_t t = 0; t < taps; ++t) shares[t] = sum != 0 ? shares[t] / sum : 1.0 / taps;
   }
 };
 
-// Rounds shares so that their sum is exact: what rounding leaves over goes to the next.
+// Rounds weights so that their sum is exact: rounding errors are carried to the next weight.
 void RoundShares(const double* shares, int32_t taps, int32_t shift, int16_t* weights) {
   const double one = std::ldexp(1, shift);
   double sum = 0;
@@ -117,8 +117,8 @@ Status FilterWindows::Make(const SourceEdge& edge, int32_t count, ScaleFilter fi
   shift_ = mostShift;
   while (shift_ > 1 && std::ldexp(largest, shift_) > INT16_MAX - 1) --shift_;
 
-  // Equal halves of an edge get windows that mirror each other to the last bit. The box has no
-  // mirror: of two pixels at its borders it takes the left one.
+  // The two halves of an edge get exactly mirrored windows. The box filter is asymmetric: of two
+  // pixels on its borders it uses the left one.
   const bool mirrored = filter != ScaleFilter::Box && 2 * edge.begin + edge.extent == edge.count;
   for (int32_t i = 0; i < count; ++i) {
     const size_t place = static_cast<size_t>(i) * static_cast<size_t>(mostTaps_);

@@ -10,11 +10,11 @@ namespace fotomill {
 
 namespace {
 
-// Pixels of a tile's side: source and destination of a tile stay in the second cache while rows
-// become columns. Smaller ones, for the first cache, take half as long again.
+// Tile edge in pixels: the source and destination tiles fit in the L2 cache during transposition.
+// Smaller tiles for the L1 cache take 50 % longer.
 constexpr int32_t kTile = 128;
 
-// Source and destination as grids of pixels of `bytes` each, addressed from the top.
+// Source and destination as arrays of pixels of `bytes` each, top row first.
 template <int bytes>
 void TurnTile(const PackedImage& from, PackedImage& to, Turn turn, int32_t left, int32_t top) {
   const int32_t right = std::min(left + kTile, to.Width()),
@@ -24,7 +24,7 @@ void TurnTile(const PackedImage& from, PackedImage& to, Turn turn, int32_t left,
     const int32_t column = turn.flipX ? from.Width() - 1 - y : y;
     const int32_t firstRow = turn.flipY ? from.Height() - 1 - left : left;
     const uint8_t* source = from.Row(firstRow).data() + static_cast<size_t>(column) * bytes;
-    // Rows are stored from the bottom up, so a step down in the picture is a step back in memory.
+    // Rows are stored bottom-up, so the next row down is at a lower address.
     const auto stride = static_cast<std::ptrdiff_t>(from.Stride());
     const std::ptrdiff_t step = turn.flipY ? stride : -stride;
     for (int32_t x = left; x < right; ++x, pixel += bytes) {
@@ -69,7 +69,7 @@ Status OrientImage(const PackedImage& image, Orientation orientation, PackedImag
     const auto turnRows = image.Bits() == 24 ? TurnRows<3> : TurnRows<1>;
     turnRows(image, made, turn);
   } else {
-    // Several pixels a byte: turned as bytes, then packed again.
+    // Several pixels per byte: unpacked to bytes, rotated, and packed again.
     PackedImage deep, deepTurned;
     RETURN_IF_BAD(PromoteImage(image, 8, deep));
     RETURN_IF_BAD(NewPackedImage(width, height, nullptr, 8, deepTurned));

@@ -13,13 +13,13 @@ namespace fotomill {
 
 namespace {
 
-// a reduction by twice as much or more is begun by averaging blocks of pixels
+// reductions by at least twice this factor first average blocks of pixels
 constexpr double kLeftToFilter = 4;
-constexpr int32_t kMostByteShift = 20;   // precision of the weights for whole gray levels
-constexpr int32_t kMostShortShift = 15;  // and for samples: sums stay below 2^31
+constexpr int32_t kMostByteShift = 20;   // precision of the weights for 8-bit levels
+constexpr int32_t kMostShortShift = 15;  // and for samples: keeps sums below 2^31
 
-// How the pixels along an edge are averaged: in blocks of `block`, of which the first begins
-// `overhang` pixels before the edge, so that what does not divide evenly is cut from both ends.
+// Block averaging along an axis: blocks of `block` pixels, the first of which starts `overhang`
+// pixels before the edge, so that an uneven rest is split between both ends.
 struct Blocks {
   int32_t block = 1, count = 0, overhang = 0;
 
@@ -34,7 +34,7 @@ struct Blocks {
   int32_t End(int32_t i, int32_t sourceCount) const {
     return std::min(i * block - overhang + block, sourceCount);
   }
-  // The edge in blocks, for the filter; `reach` pixels belong to the picture.
+  // The axis in blocks, for the filter; `reach` pixels belong to the picture.
   SourceEdge Edge(double reach) const {
     return {count, static_cast<double>(overhang) / block, reach / block};
   }
@@ -48,11 +48,11 @@ bool IsOpaque(const PackedImage& alpha) {
   return true;
 }
 
-// The curve between stored levels and light, both as samples. Source: IEC 61966-2-1, section 5.2.
+// The sRGB transfer curve, with linear light as samples. Source: IEC 61966-2-1, section 5.2.
 struct LightCurve {
   static constexpr int32_t kMost = 255 << kFraction;
-  std::array<int16_t, 256> light;               // of each level
-  std::array<uint8_t, kMost + 1> level;         // of each amount of light
+  std::array<int16_t, 256> light;               // by level
+  std::array<uint8_t, kMost + 1> level;         // by amount of light
   LightCurve() {
     for (size_t v = 0; v < light.size(); ++v) {
       const double c = static_cast<double>(v) / 255;
@@ -75,8 +75,8 @@ const LightCurve& Light() {
   return curve;
 }
 
-// Delivers the rows of a picture as samples, averaged in blocks where it shrinks much. Rows are
-// asked for in order.
+// Delivers the rows of a picture as samples, block-averaged for large reductions. Rows must be
+// requested in order.
 class SampleSource {
  public:
   // `alpha` and `light` may be null.
@@ -165,7 +165,7 @@ class SampleSource {
   platform::MemoryBlock wide_, sums_;
 };
 
-// Divides the colors by their alpha again. A pixel that nothing is seen of is black.
+// Divides colors by their alpha. Fully transparent pixels become black.
 void SplitAlpha(const int16_t* pixels, int32_t width, const LightCurve* light, uint8_t* bgr,
                 uint8_t* alpha) {
   for (int32_t x = 0; x < width; ++x, pixels += 4, bgr += 3) {
@@ -186,17 +186,17 @@ void SplitLight(const int16_t* samples, size_t count, const LightCurve& light, u
         light.level[static_cast<size_t>(std::clamp<int32_t>(samples[i], 0, LightCurve::kMost))];
 }
 
-// What all bands of one picture on its way to another size share.
+// Shared by all bands of a resampling operation.
 struct ResamplePlan {
   const PackedImage* image = nullptr;
-  const PackedImage* alpha = nullptr;   // null without one, or where it is opaque
-  const LightCurve* light = nullptr;    // null: levels are averaged as they are
+  const PackedImage* alpha = nullptr;   // null if none, or opaque
+  const LightCurve* light = nullptr;    // null: levels are averaged as stored
   Blocks columns, rows;
   Size size{0, 0};
   int32_t channels = 3;
   bool acrossFirst = false;
-  bool direct = false;  // rows of a 24-bit picture can be weighed as they lie
-  size_t samples = 0;   // of a row that is weighed
+  bool direct = false;  // rows of a 24-bit picture can be used without a copy
+  size_t samples = 0;   // per source row
   mutable FilterWindows across, down;
 
   Status Make(const PackedImage& source, const PackedImage* plane, Reach reach, Size target,
@@ -219,12 +219,12 @@ struct ResamplePlan {
   }
 };
 
-// A band of rows of the result, in two passes: down, rows are weighed into one; across, a row is
-// scaled. A picture that gets fewer rows goes down first, so that less is left to scale across; one
-// that gets more goes across first.
+// Computes a band of result rows in two passes: vertical, a weighted sum of rows, and horizontal,
+// scaling a row. When reducing the height, the vertical pass runs first, leaving fewer rows to
+// scale; when enlarging, the horizontal pass does.
 class Resampling {
  public:
-  // From row `first` of the result on. The plan must outlive it.
+  // Starts at row `first` of the result. The plan must outlive it.
   Status Open(const ResamplePlan& plan, int32_t first) {
     plan_ = &plan;
     lastRow_ = plan.rows.count - 1;
@@ -248,7 +248,7 @@ class Resampling {
     return room ? Status::Ok : Status::MemoryAllocationError;
   }
 
-  // Row y of the result; rows are asked for in order.
+  // Row y of the result; must be called in order.
   void ScaleRow(int32_t y, std::span<uint8_t> bgr, std::span<uint8_t> alpha) {
     int16_t* columns = columns_.Items<int16_t>().data();
     int16_t* pixels = pixels_.Items<int16_t>().data();
@@ -269,7 +269,7 @@ class Resampling {
   }
 
  private:
-  static constexpr size_t kSpare = 8;  // samples that a pass may write behind a row's end
+  static constexpr size_t kSpare = 8;  // samples that a pass may write past the end of a row
 
   void Across(const int16_t* columns, int16_t* pixels) {
     const auto scale = plan_->channels == 3 ? kernels_.scaleThree : kernels_.scaleFour;
@@ -304,7 +304,7 @@ class Resampling {
     }
   }
 
-  // The rows of a window. Those without weight that would be behind the last row are the last row.
+  // The rows of a window. Padding taps past the last row use the last row.
   template <typename Sample, typename RowAt>
   const Sample* const* RowsOf(const FilterWindow& window, RowAt rowAt) {
     const Sample** rows = pointers_.Items<const Sample*>().data();
@@ -317,14 +317,14 @@ class Resampling {
   SampleSource source_;
   int32_t lastRow_ = 0;
   int32_t held_ = 0, filled_ = 0;
-  size_t stride_ = 0;              // samples of a row that is weighed, filled up
-  platform::MemoryBlock ring_;     // `held_` rows that the windows of rows may need
-  platform::MemoryBlock columns_;  // one row as wide as the source, zeros behind its end
-  platform::MemoryBlock pixels_;   // one row as wide as the result
+  size_t stride_ = 0;              // samples per source row, padded
+  platform::MemoryBlock ring_;     // the last `held_` source rows
+  platform::MemoryBlock columns_;  // one row of source width, zero-padded
+  platform::MemoryBlock pixels_;   // one row of result width
   platform::MemoryBlock pointers_;
 };
 
-constexpr int32_t kLeastRows = 32;  // of a band, so that little is computed twice
+constexpr int32_t kLeastRows = 32;  // per band, to limit duplicate work
 
 Status ScaleInBands(const ResamplePlan& plan, const ScaleOptions& options, PackedImage& made,
                     PackedImage& madeAlpha) {

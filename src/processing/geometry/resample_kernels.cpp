@@ -10,7 +10,7 @@ using FourInts [[gnu::vector_size(16)]] = int32_t;
 using EightShorts [[gnu::vector_size(16)]] = int16_t;
 using EightBytes [[gnu::vector_size(8)]] = uint8_t;
 
-// Vectors of 16 bytes, which every processor of the build has or the compiler makes up.
+// 16-byte vectors, in the baseline of every build or emulated by the compiler.
 namespace baseline {
 
 constexpr int kBytes = 16;
@@ -67,7 +67,7 @@ inline Shorts TwoWeights(const int16_t* weights) {
   return (Shorts)(Ints{} + LoadAs<int32_t>(weights));
 }
 inline Shorts WeightsOfPairs(const int16_t* weights) { return TwoWeights(weights); }
-// Two pixels, channel by channel.
+// Two pixels, by channel.
 template <int channels>
 inline Shorts LoadPixelPairs(const int16_t* pixels) {
   return InterleaveLow(Load(pixels), Load(pixels + channels));
@@ -98,7 +98,7 @@ inline Shorts Load(const int16_t* samples) { return LoadAs<Shorts>(samples); }
 inline Shorts Load(const uint8_t* levels) {
   return (Shorts)_mm256_cvtepu8_epi16(LoadAs<__m128i>(levels));
 }
-// Within each half of 16 bytes; Pack puts the order right again.
+// Within each half of 16 bytes; Pack restores the order.
 inline Shorts InterleaveLow(Shorts a, Shorts b) {
   return __builtin_shufflevector(a, b, 0, 16, 1, 17, 2, 18, 3, 19, 8, 24, 9, 25, 10, 26, 11, 27);
 }
@@ -123,7 +123,7 @@ inline Shorts WeightsOfPairs(const int16_t* weights) {
   const Ints both = (Ints)_mm256_set1_epi64x(LoadAs<int64_t>(weights));
   return (Shorts)__builtin_shufflevector(both, both, 0, 0, 0, 0, 1, 1, 1, 1);
 }
-// Four pixels, two in each half, channel by channel.
+// Four pixels, two in each half, by channel.
 template <int channels>
 inline Shorts LoadPixelPairs(const int16_t* pixels) {
   const EightShorts low = LoadAs<EightShorts>(pixels),

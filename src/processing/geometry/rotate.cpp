@@ -11,9 +11,9 @@ namespace fotomill {
 namespace {
 
 constexpr double kRadians = std::numbers::pi / 180;
-constexpr double kHair = 1e-7;  // what rounding errors may add to a length in pixels
+constexpr double kHair = 1e-7;  // tolerance for rounding errors, in pixels
 
-// Cut off far above what can be held, so that the check of the size says so.
+// Clamped far above the limit, so that the size check fails.
 int32_t RoundedUp(double length) {
   return static_cast<int32_t>(std::clamp(std::ceil(length - kHair), 1.0, 2e9));
 }
@@ -55,7 +55,7 @@ Size StraightenedSize(Size picture, double angle) {
   const double shorter = std::min(width, height), longer = std::max(width, height);
   double across = width, down = height;
   if (shorter <= 2 * sine * cosine * longer || std::abs(sine - cosine) < 1e-9) {
-    // Two corners touch the longer edges, the others are inside.
+    // Two corners touch the longer edges, the other two are inside.
     across = shorter / 2 / (width >= height ? sine : cosine);
     down = shorter / 2 / (width >= height ? cosine : sine);
   } else {
@@ -111,7 +111,7 @@ Status UnwarpPicture(PictureRecord& picture, const Corner (&corners)[4], Size si
   };
   if (size.width <= 0) size.width = whole(std::max(edge(0, 1), edge(3, 2)));
   if (size.height <= 0) size.height = whole(std::max(edge(0, 3), edge(1, 2)));
-  // From the unit square: x = (a u + b v + c) / (g u + h v + 1), y likewise with d, e, f.
+  // Maps from the unit square: x = (a u + b v + c) / (g u + h v + 1), y likewise with d, e, f.
   const Corner &p0 = corners[0], &p1 = corners[1], &p2 = corners[2], &p3 = corners[3];
   const double sumX = p0.x - p1.x + p2.x - p3.x, sumY = p0.y - p1.y + p2.y - p3.y;
   const double dx1 = p1.x - p2.x, dy1 = p1.y - p2.y, dx2 = p3.x - p2.x, dy2 = p3.y - p2.y;

@@ -7,33 +7,33 @@
 
 namespace fotomill {
 
-// Turns, slants and stretches of a whole picture. Angles are degrees, clockwise. Statuses as
-// WarpPicture.
+// Rotation, shear and perspective of a whole picture. Angles are in degrees, clockwise.
+// Statuses as WarpPicture.
 
-// Rotates about the center, which stays the center. Multiples of 90 move whole pixels and keep the
-// depth. Grows to |w cos| + |h sin|, rounded up, or keeps the size.
+// Rotates about the center. Multiples of 90 move whole pixels and keep the depth. With `grow` the
+// size becomes |w cos| + |h sin|, rounded up, and likewise the height; else it is unchanged.
 Status RotatePicture(PictureRecord& picture, double angle, bool grow, const WarpOptions& options,
                      const Work& work);
 
-// Rotates, and cuts down to the largest upright rectangle within the picture; by less than 90
-// degrees.
+// Rotates by less than 90 degrees, and crops to the largest axis-aligned rectangle
+// inside the picture.
 Status StraightenPicture(PictureRecord& picture, double angle, WarpFilter filter, const Work& work);
 // The size of that rectangle.
 Size StraightenedSize(Size picture, double angle);
 
-// Slants columns sideways by an angle, then rows down by another; grows as far as needed. By less
+// Shears horizontally by an angle, then vertically by another; grows as needed. By less
 // than 90 degrees.
 Status ShearPicture(PictureRecord& picture, double across, double down, const WarpOptions& options,
                     const Work& work);
 
-// The map from a rectangle onto four points of a picture, clockwise from the top left, all in
-// pixels from the top left corner of the picture. `size` is that of the rectangle; width or height
-// 0: as long as the longer of the two edges. Source: P. Heckbert, "Fundamentals of Texture Mapping
-// and Image Warping", Berkeley (1989), section 2.2.3.
+// Maps four points of a picture, clockwise from the top left, in pixels
+// from its top left corner, to a rectangle of `size`; width or height
+// 0: the longer of the two edges. Source: P. Heckbert, "Fundamentals of
+// Texture Mapping and Image Warping", Berkeley (1989), section 2.2.3.
 struct Corner {
   double x, y;
 };
-// EmptyImage when the points are not the corners of a convex shape, in that order.
+// EmptyImage if the points are not the corners of a convex quadrilateral, in that order.
 Status UnwarpPicture(PictureRecord& picture, const Corner (&corners)[4], Size size,
                      const WarpOptions& options, const Work& work);
 

@@ -8,19 +8,19 @@
 
 namespace fotomill {
 
-// Four weights along a line that add up to kWeightOne.
+// Four weights along an axis that add up to kWeightOne.
 inline constexpr int32_t kWeightBits = 14;
 inline constexpr int32_t kWeightOne = 1 << kWeightBits;
 using Weights = int16_t[4];
 
-// What is kept of a column's sum between the two passes: six bits of fraction, so that it fits a
-// word.
+// Column sums between the two passes keep six
+// fractional bits, so that they fit in 16 bits.
 inline constexpr int32_t kColumnShift = kWeightBits - 6;
 inline constexpr int32_t kSumShift = kWeightBits + 6;
 
-// Sixteen pixels, four in each of four rows, weighed into one: first down, then across. `rows`
-// point at the first of the four; 16 bytes of each may be read. Rounded, ties up, and clamped. Both
-// forms give the same.
+// Weighted sum of 4 x 4 pixels: vertical, then horizontal. `rows` point to the first pixel
+// of each row; 16 bytes of each may be read. Rounded, ties up, and clamped. Both versions
+// give identical results.
 inline void SampleBgrPlain(const uint8_t* const rows[4], const Weights& across, const Weights& down,
                            uint8_t* bgr) {
   for (int c = 0; c < 3; ++c) {
@@ -34,9 +34,9 @@ inline void SampleBgrPlain(const uint8_t* const rows[4], const Weights& across, 
   }
 }
 
-#if VECTOR_HAS_AVX2  // that is, x86 of 64 bits, all of which have SSE2
-// Bytes 4 n to 4 n + 3 of the rows: `upper` and `lower` are words of rows 0 and 1 and of rows 2 and
-// 3 in turn.
+#if VECTOR_HAS_AVX2  // x86-64, which always has SSE2
+// Four column sums, for bytes 4 n to 4 n + 3: `upper` has those bytes of rows 0 and 1 interleaved as
+// words, `lower` those of rows 2 and 3.
 inline __m128i ColumnSums(__m128i upper, __m128i lower, __m128i upperWeights,
                           __m128i lowerWeights) {
   const __m128i sum =
@@ -67,7 +67,7 @@ inline void SampleBgr(const uint8_t* const rows[4], const Weights& across, const
                                    upperWeights, lowerWeights);
   // Words: b0 g0 r0 b1 g1 r1 b2 g2 and r2 b3 g3 r3.
   const __m128i front = _mm_packs_epi32(first, second), back = _mm_packs_epi32(third, third);
-  // from b2 on
+  // starting at b2
   const __m128i end = _mm_or_si128(_mm_srli_si128(front, 12), _mm_slli_si128(back, 4));
   const __m128i left = _mm_unpacklo_epi16(front, _mm_srli_si128(front, 6)),
                 right = _mm_unpacklo_epi16(end, _mm_srli_si128(end, 6));

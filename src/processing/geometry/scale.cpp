@@ -12,7 +12,7 @@ namespace fotomill {
 
 namespace {
 
-// In the order of choice::ResampleFilter.
+// Indexed by choice::ResampleFilter.
 constexpr ScaleFilter kFilterOfKey[] = {ScaleFilter::Bicubic, ScaleFilter::Lanczos,
                                         ScaleFilter::Bilinear, ScaleFilter::Nearest};
 static_assert(kFilterOfKey[choice::kBicubic] == ScaleFilter::Bicubic &&
@@ -20,7 +20,7 @@ static_assert(kFilterOfKey[choice::kBicubic] == ScaleFilter::Bicubic &&
               kFilterOfKey[choice::kBilinear] == ScaleFilter::Bilinear &&
               kFilterOfKey[choice::kNearest] == ScaleFilter::Nearest);
 
-// The source pixel under the middle of pixel `i` of `count`.
+// The source pixel at the center of pixel `i` of `count`.
 constexpr int32_t SourcePixel(int32_t i, int32_t count, int32_t sourceCount) {
   return static_cast<int32_t>((2 * static_cast<int64_t>(i) + 1) * sourceCount /
                               (2 * static_cast<int64_t>(count)));
@@ -39,7 +39,7 @@ int32_t AtPercentage(int32_t edge, int32_t percentage) {
   return static_cast<int32_t>(std::clamp<int64_t>(scaled, 1, INT32_MAX));
 }
 
-// Puts scaled images in the place of a picture's own.
+// Replaces a picture's images with scaled ones.
 void Replace(PictureRecord& picture, PackedImage& image, PackedImage& alpha) {
   picture.image = std::move(image);
   picture.alpha = std::move(alpha);
@@ -70,7 +70,7 @@ Status ScaleNearest(const PackedImage& image, Size size, PackedImage& scaled) {
   scaled.Free();
   if (image.Empty()) return Status::DamagedFile;
   if (image.Bits() < 8) {
-    // Several pixels a byte: picked as bytes, then packed again.
+    // Several pixels per byte: unpacked to bytes, scaled, and packed again.
     PackedImage deep, deepScaled, made;
     RETURN_IF_BAD(PromoteImage(image, 8, deep));
     RETURN_IF_BAD(ScaleNearest(deep, size, deepScaled));

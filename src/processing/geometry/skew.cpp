@@ -13,10 +13,10 @@ namespace fotomill {
 
 namespace {
 
-constexpr int32_t kSide = 1500;         // the longest edge of what is looked at
-// levels between a pixel and the one below it that make an edge
+constexpr int32_t kSide = 1500;         // longest edge of the picture to analyze
+// minimum difference in levels to the pixel below for an edge
 constexpr int32_t kLeastContrast = 24;
-// degrees: each search goes two steps of the one before to either side
+// degrees: each search covers two steps of the previous one on either side
 constexpr double kSteps[] = {0.5, 0.1, 0.02};
 
 struct Dot {
@@ -36,7 +36,8 @@ Status FindEdges(const PackedImage& image, std::vector<Dot>& dots) {
     for (int32_t x = 0; x < image.Width(); ++x, bgr += 3) {
       int32_t& last = above[static_cast<size_t>(x)];
       const int32_t luma = LumaOf(bgr);
-      // Only from dark to light: the lower edges of letters, most of which stand on a line.
+      // Only dark-to-light transitions: the lower edges of letters, most of which are
+      // on the baseline.
       if (y > 0 && luma - last >= kLeastContrast) dots.push_back({x, y});
       last = luma;
     }
@@ -48,7 +49,7 @@ uint64_t Score(const std::vector<Dot>& dots, double degrees, std::vector<uint32_
                int32_t width) {
   const double slope = std::tan(degrees * std::numbers::pi / 180);
   std::ranges::fill(counts, 0u);
-  // In 1 / 65536 of a row, so that the sums are the same everywhere.
+  // In 1 / 65536 of a row, so that results are the same on every machine.
   const auto step = static_cast<int64_t>(std::lround(slope * 65536));
   const int64_t start = (static_cast<int64_t>(width) << 16) + 32768;
   for (const Dot& dot : dots) {

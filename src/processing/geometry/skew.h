@@ -6,13 +6,13 @@
 
 namespace fotomill {
 
-// By how many degrees, clockwise, the lines of a scanned page are turned; at most `most` either
-// way, exact to about 0.1. 0 for pictures without lines. A rotation by the negative angle sets it
-// straight. MemoryAllocationError, FunctionCancelled.
+// Detects the skew of a scanned page in degrees, clockwise; at most `most` in either direction,
+// accurate to about 0.1. 0 for pictures without lines. Rotating by the negative angle deskews it.
+// MemoryAllocationError, FunctionCancelled.
 //
-// Edges between dark and light are counted along slanted lines. The angle at which the sum of the
-// squares of the counts is largest is the page's: there, lines of text and the gaps between them
-// are apart. Source: W. Postl, "Detection of Linear Oblique Structures and Skew Scan in Digitized
+// Counts edges between dark and light along slanted lines. The angle that maximizes the sum of
+// the squared counts is the page's, as it separates lines of text from the gaps between them.
+// Source: W. Postl, "Detection of Linear Oblique Structures and Skew Scan in Digitized
 // Documents", ICPR (1986).
 Status FindSkew(const PictureRecord& picture, double most, const Work& work, double& angle);
 

@@ -12,7 +12,7 @@ namespace fotomill {
 
 namespace {
 
-// columns: the rows of the source under them stay in the processor's cache
+// columns: the source rows below them fit in the processor's cache
 constexpr int32_t kTile = 512;
 constexpr int32_t kLeastRows = 16;
 constexpr int32_t kPhaseBits = 10;
@@ -36,8 +36,8 @@ double WeightOf(WarpFilter filter, double distance) {
   return distance > -0.5 && distance <= 0.5 ? 1 : 0;
 }
 
-// The weights of the pixels at -1, 0, 1 and 2 for a place between 0 and 1. What rounding leaves
-// over goes to the nearer one.
+// The weights of the pixels at -1, 0, 1 and 2 for a position between 0 and 1. Rounding errors go to
+// the nearer of the middle two.
 WeightTable WeightsOf(WarpFilter filter) {
   WeightTable table;
   for (size_t phase = 0; phase < kPhases; ++phase) {
@@ -54,9 +54,9 @@ WeightTable WeightsOf(WarpFilter filter) {
   return table;
 }
 
-// A place to the nearest phase.
+// A position rounded to the nearest phase.
 struct Phased {
-  int64_t first;  // the first of the four pixels around it
+  int64_t first;  // first of the four pixels around it
   size_t phase;
 
   explicit Phased(int64_t place) {
@@ -67,13 +67,13 @@ struct Phased {
   }
 };
 
-// Sixteen pixels of a picture without and with alpha.
+// 4 x 4 pixels, with or without alpha.
 struct Patch {
   uint8_t bgr[kTaps][16];
   uint8_t alpha[kTaps][kTaps];
 };
 
-// The pixel of a patch whose colors count by their alpha.
+// Samples a patch with colors weighted by alpha.
 void SampleAlpha(const Patch& patch, const Weights& across, const Weights& down, uint8_t* bgr,
                  uint8_t* opacity) {
   int64_t sums[3] = {}, weight = 0;
@@ -96,11 +96,11 @@ void SampleAlpha(const Patch& patch, const Weights& across, const Weights& down,
 
 struct Warp {
   const PackedImage& image;
-  const PackedImage* alpha;  // null without one
+  const PackedImage* alpha;  // null if none
   const WarpOptions& options;
   WeightTable weights;
-  std::ptrdiff_t down;  // from a row to the one below
-  // How far the first pixel of sixteen may be from the left and from the top with all that is read
+  std::ptrdiff_t down;  // address offset to the row below
+  // Maximum offset of a patch from the left and from the top at which all bytes read are
   // inside the picture.
   uint64_t mostLeft, mostTop;
 
@@ -121,8 +121,8 @@ struct Warp {
     return left + kTaps <= 0 || top + kTaps <= 0 || left >= image.Width() || top >= image.Height();
   }
 
-  // Collects sixteen pixels, some of which may be outside; `opaque`: the alpha of pixels of a
-  // picture without alpha.
+  // Collects 4 x 4 pixels, some of which may be outside; `opaque` is the alpha of
+  // pixels without alpha.
   void Collect(int64_t left, int64_t top, Patch& patch) const {
     const int64_t width = image.Width(), height = image.Height();
     for (int64_t j = 0; j < kTaps; ++j) {

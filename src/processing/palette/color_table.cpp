@@ -12,7 +12,7 @@ constexpr size_t kActBytes = 768, kActTrailer = 4;
 constexpr int32_t kMostColors = 256;
 constexpr std::string_view kGimp = "GIMP Palette", kJasc = "JASC-PAL", kJascVersion = "0100";
 
-// Takes the first line off a text, without its end and the blanks around it.
+// Removes and returns the first line of a text, without its line ending and surrounding blanks.
 std::string_view TakeLine(std::string_view& text) {
   const size_t end = text.find('\n');
   std::string_view line = text.substr(0, end);
@@ -22,7 +22,7 @@ std::string_view TakeLine(std::string_view& text) {
   return line.substr(0, line.find_last_not_of(kBlanks) + 1);
 }
 
-// Takes a whole number of 0 to `most` off the start of a line, with the blanks behind it.
+// Parses and removes an integer from 0 to `most` at the start of a line, and the blanks after it.
 std::optional<int32_t> TakeNumber(std::string_view& line, int32_t most) {
   int32_t number = 0;
   const auto [end, error] = std::from_chars(line.data(), line.data() + line.size(), number);
@@ -38,8 +38,7 @@ struct Table {
   Palette palette{};
   int32_t count = 0;
 
-  // Reads the three numbers at the start of a line. False when they are not there or the table is
-  // full.
+  // Reads the three numbers at the start of a line. False if they are missing or the table is full.
   bool Add(std::string_view& line) {
     if (count == kMostColors) return false;
     for (size_t c = 0; c < 3; ++c) {
@@ -63,7 +62,7 @@ bool ReadAct(std::string_view bytes, Table& table) {
   return true;
 }
 
-// Lines of colors; with `named`, anything may follow the numbers.
+// Lines of colors; with `named`, numbers may be followed by anything.
 bool ReadLines(std::string_view text, bool named, Table& table) {
   while (!text.empty()) {
     std::string_view line = TakeLine(text);
@@ -108,7 +107,7 @@ Status ReadColorTable(std::string_view contents, Palette& palette, int32_t& coun
                                : false;
   if (first != kGimp && first != kJasc) {
     read = ReadLines(contents, false, table);
-    if (!read && act) {  // text of just that length is text
+    if (!read && act) {  // valid text of that length is text
       table = {};
       read = ReadAct(contents, table);
     }

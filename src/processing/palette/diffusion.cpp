@@ -17,7 +17,7 @@ constexpr ErrorShare kBurkes[] = {{1, 0, 8}, {2, 0, 4}, {-2, 1, 2}, {-1, 1, 4},
 constexpr ErrorShare kSierra[] = {{1, 0, 5}, {2, 0, 3}, {-2, 1, 2}, {-1, 1, 4}, {0, 1, 5},
                                   {1, 1, 4}, {2, 1, 2}, {-1, 2, 2}, {0, 2, 3},  {1, 2, 2}};
 
-constexpr int32_t kUnit = 65536;  // of a level
+constexpr int32_t kUnit = 65536;  // per level
 
 }  // namespace
 

@@ -9,8 +9,8 @@ namespace fotomill {
 
 namespace {
 
-// Bayer's pattern: the order in which the pixels of a square of `size` x `size` (2, 4 or 8) turn
-// white, from 0 on.
+// Bayer matrix: the order, from 0, in which the pixels of a square of `size` x `size` (2, 4 or 8)
+// turn white.
 constexpr int32_t PatternOrder(int32_t size, int32_t x, int32_t y) {
   int32_t order = 0;
   for (int32_t bit = 0; 1 << bit < size; ++bit) {
@@ -24,7 +24,7 @@ static_assert(PatternOrder(8, 0, 0) == 0 && PatternOrder(8, 1, 0) == 32 &&
 static_assert(PatternOrder(2, 1, 0) == 2 && PatternOrder(2, 0, 1) == 3 &&
               PatternOrder(2, 1, 1) == 1);
 
-// Columns that a row of a pattern is written out for.
+// Number of columns for which a pattern row is precomputed.
 constexpr int32_t kColumns = 8;
 
 constexpr int32_t Clamp(int32_t value) { return std::clamp(value, 0, 255); }
@@ -49,7 +49,7 @@ void OrderRow(const uint8_t* bgr, int32_t width, int32_t y, int32_t size, int32_
 }
 
 void OrderGrayRow(const uint8_t* gray, int32_t width, int32_t y, int32_t size, uint8_t* indices) {
-  // The shades of the pattern, one more than it has places, lie evenly between black and white: 0
+  // The pattern's shades, one more than it has elements, are evenly spaced from black to white: 0
   // is never white, 255 always is.
   int32_t limits[kColumns];
   for (int32_t i = 0; i < kColumns; ++i)
@@ -82,9 +82,9 @@ void ErrorDiffuser::GrayRow(const uint8_t* gray, uint8_t* indices) {
   backwards_ = serpentine_ && !backwards_;
 }
 
-// A pixel hands 7/16 of its error ahead, and 3/16, 5/16 and 1/16 down: to the pixel below the last,
-// below itself and below the next. What was handed down to a pixel is read before its own row hands
-// on to the same place.
+// A pixel's error is diffused by 7/16 ahead, and by 3/16, 5/16 and 1/16 down: below the previous
+// pixel, below itself and below the next. The error from above is read before the current row
+// overwrites its position.
 template <int step>
 void ErrorDiffuser::DiffuseRow(const uint8_t* bgr, NearestColor& nearest, uint8_t* indices) {
   int32_t ahead[3] = {}, belowLast[3] = {}, belowHere[3] = {};

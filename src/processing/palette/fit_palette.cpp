@@ -12,10 +12,10 @@ namespace {
 
 using Point = std::array<double, 3>;
 
-constexpr int kMostRounds = 12;          // of moving the colors
-constexpr double kWorthAnother = 0.002;  // least share by which a round must reduce the error
+constexpr int kMostRounds = 12;          // of Lloyd's algorithm
+constexpr double kWorthAnother = 0.002;  // minimum relative error reduction for another round
 
-// A run of bins with its mean, and the axis along which it is widest.
+// A range of bins with its mean, and its principal axis.
 struct Group {
   size_t begin, end;
   Point mean;
@@ -23,7 +23,7 @@ struct Group {
   double spread;  // squared error along the axis
 };
 
-// The longest axis of a symmetric matrix and its eigenvalue, by power iteration.
+// The principal axis of a symmetric matrix and its eigenvalue, by power iteration.
 double LongestAxis(const double (&matrix)[3][3], Point& axis) {
   int widest = 0;
   for (int i = 1; i < 3; ++i) {
@@ -70,7 +70,7 @@ Group MakeGroup(std::span<const ColorBin> bins, size_t begin, size_t end) {
   return group;
 }
 
-// Cuts the group in two at its mean; false when all its bins are on one side.
+// Splits the group in two at its mean; false if all its bins are on one side.
 bool Split(std::span<ColorBin> bins, Group& group, Group& other) {
   const auto first = bins.begin() + static_cast<std::ptrdiff_t>(group.begin);
   const auto last = bins.begin() + static_cast<std::ptrdiff_t>(group.end);
@@ -105,7 +105,7 @@ std::vector<Point> CutIntoGroups(std::span<ColorBin> bins, size_t colors) {
   return means;
 }
 
-// A bin as the search for the nearest color wants it.
+// A bin as a point for NearestColor.
 std::array<int32_t, 3> PointOf(const ColorBin& bin) {
   std::array<int32_t, 3> point;
   for (size_t c = 0; c < 3; ++c)
@@ -113,8 +113,8 @@ std::array<int32_t, 3> PointOf(const ColorBin& bin) {
   return point;
 }
 
-// One round: every bin goes to the color nearest to it, then every color to the mean of its bins.
-// Returns the squared error before the move.
+// One round of Lloyd's algorithm: assigns every bin to the nearest color, then moves every color to
+// the mean of its bins. Returns the squared error before the move.
 double MoveToMeans(std::span<const ColorBin> bins, NearestColor& nearest, ColorPoints& points) {
   struct Sum {
     double channel[3] = {}, weight = 0;
@@ -150,7 +150,7 @@ double MoveToMeans(std::span<const ColorBin> bins, NearestColor& nearest, ColorP
 Status FitPalette(const std::vector<ColorBin>& bins, int32_t colors, ColorPoints& points) {
   points.count = 0;
   if (bins.empty()) return Status::Ok;
-  std::vector<ColorBin> weighed = bins;  // as distances count
+  std::vector<ColorBin> weighed = bins;  // scaled by the channel weights
   for (ColorBin& bin : weighed) {
     for (size_t c = 0; c < 3; ++c)
       bin.channel[c] *= std::sqrt(static_cast<float>(kChannelWeight[c]));

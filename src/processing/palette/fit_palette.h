@@ -9,18 +9,18 @@
 
 namespace fotomill {
 
-// Finds at most `colors` (1 to 256) colors that stand for the bins with the least squared error:
-// groups are cut in two across their longest axis, the worst group first (Orchard and Bouman 1991),
-// then all are moved to the middle of the bins nearest to them, over and over (Lloyd 1982).
-// MemoryAllocationError.
+// Finds at most `colors` (1 to 256) colors that approximate the bins with the least squared
+// error: groups are split across their principal axis, the worst group first (Orchard and
+// Bouman 1991), then all colors are repeatedly moved to the means of the bins nearest to them
+// (Lloyd 1982). MemoryAllocationError.
 Status FitPalette(const std::vector<ColorBin>& bins, int32_t colors, ColorPoints& points);
 
-// Sums of the pixels that took each color.
+// Mean color of the pixels mapped to each palette color.
 class ColorMeans {
  public:
-  // Takes in one row: pixels of three bytes, and the index of the color that each took.
+  // Adds a row: pixels of three bytes, and the palette index of each.
   void AddRow(const uint8_t* bgr, const uint8_t* indices, int32_t width);
-  // Moves each color to the mean of its pixels; one that no pixel took stays.
+  // Moves each color to the mean of its pixels; unused ones are unchanged.
   void Move(ColorPoints& points) const;
 
  private:

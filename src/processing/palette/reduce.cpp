@@ -20,11 +20,11 @@ namespace fotomill {
 
 namespace {
 
-constexpr int32_t kWhole = 100;              // per cent
-// rounds in which the pixels themselves move the palette's colors
+constexpr int32_t kWhole = 100;              // percent
+// rounds of refining the palette with the pixels themselves
 constexpr int kRefinements = 3;
-constexpr int64_t kRefinedPixels = 200'000;  // about as many pixels take part
-// a picture of fewer cells of colors has its colors counted one by one
+constexpr int64_t kRefinedPixels = 200'000;  // approximate number of pixels sampled
+// below this number of histogram cells, colors are counted exactly
 constexpr int32_t kFewCells = 1024;
 
 // Share of the quantization error that is diffused, in sixteenths. All of it preserves the mean of
@@ -33,21 +33,21 @@ constexpr int32_t kFewCells = 1024;
 // the colors are.
 constexpr int32_t kHandedOnMono = 16, kHandedOnFew = 12, kHandedOnMany = 10;
 constexpr int32_t kFew = 16;  // colors
-constexpr int32_t kRowsUnasked = 32;  // between two questions whether to go on
+constexpr int32_t kRowsUnasked = 32;  // between cancellation checks
 
-// Brightness 0 to 255 (ITU-R BT.601); of a gray it is the gray itself.
+// Luma, 0 to 255 (ITU-R BT.601); for grays the gray level itself.
 constexpr uint8_t Brightness(const uint8_t* bgr) {
   return static_cast<uint8_t>((29 * bgr[0] + 150 * bgr[1] + 77 * bgr[2] + 128) >> 8);
 }
 
-// Luma of the operations: rounded for dithers, rounded down for thresholds, which compares as the
-// exact one does.
+// Luma as used by operations: rounded for dithers; for thresholds rounded down, which gives the
+// same result as the exact value.
 uint8_t RoundedLuma(const uint8_t* bgr) { return Luma(bgr[2], bgr[1], bgr[0]); }
 uint8_t LumaBelow(const uint8_t* bgr) {
   return static_cast<uint8_t>(LumaThousandths(bgr[2], bgr[1], bgr[0]) / 1000);
 }
 
-// The rows of a picture as they are to be reduced: 24 bits, adjusted, and gray where wanted.
+// Source rows for the reduction: 24 bits, adjusted, and gray if requested.
 class SourceRows {
  public:
   Status Open(const PackedImage& image, const ReduceOptions& options) {
@@ -91,7 +91,7 @@ class SourceRows {
   platform::MemoryBlock row_;
 };
 
-// The limit between dark and bright that leaves the least variance on its two sides.
+// Otsu's threshold: minimizes the variance within the dark and the bright pixels.
 int32_t BestThreshold(const std::array<uint64_t, 256>& counts) {
   double all = 0, sum = 0;
   for (size_t i = 0; i < 256; ++i) {
@@ -114,8 +114,8 @@ int32_t BestThreshold(const std::array<uint64_t, 256>& counts) {
   return threshold;
 }
 
-// The usual distance between a color and the one nearest to it, which an ordered pattern has to
-// bridge.
+// The average distance between a color and its nearest neighbor, to be bridged by
+// an ordered dither.
 int32_t PaletteSpacing(const Palette& palette, int32_t count) {
   double sum = 0;
   for (int32_t i = 0; i < count; ++i) {
@@ -134,7 +134,7 @@ int32_t PaletteSpacing(const Palette& palette, int32_t count) {
   return static_cast<int32_t>(sum / count);
 }
 
-// The same for palettes that are even in each channel: what one channel has to bridge.
+// As above, per channel, for palettes that are regular in each channel.
 int32_t ChannelSpacing(const Palette& palette, int32_t count) {
   int32_t sum = 0;
   for (int32_t i = 0; i < count; ++i) {
@@ -167,7 +167,7 @@ void SortByBrightness(ColorPoints& points) {
             [&](const auto& a, const auto& b) { return brightness(a) < brightness(b); });
 }
 
-// A picture being reduced: where its rows come from and what it becomes.
+// A reduction in progress: source rows and result.
 struct Reduction {
   PictureRecord& picture;
   const ReduceOptions& options;
@@ -177,13 +177,13 @@ struct Reduction {
   PackedImage made;
   Palette palette{};
   int32_t colors = 2;
-  int32_t handedOn = kHandedOnMono;  // sixteenths
-  bool even = false;                 // the palette was not fitted
-  const Work* work = nullptr;        // asked now and then, if there is one
+  int32_t handedOn = kHandedOnMono;  // in sixteenths
+  bool even = false;                 // the palette is not fitted
+  const Work* work = nullptr;        // checked occasionally; may be null
 
   int32_t Width() const { return picture.image.Width(); }
   int32_t Height() const { return picture.image.Height(); }
-  // FunctionCancelled when the work was stopped.
+  // FunctionCancelled if the work was stopped.
   Status StoreRow(int32_t y) {
     PackIndices(indices.Data(), Width(), bits, made.Row(y).data());
     RETURN_IF_BAD(picture.ReportRow(y + 1));
@@ -203,7 +203,7 @@ struct Reduction {
   }
 };
 
-// Writes the row of brightnesses of row y.
+// Writes the gray levels of row y.
 using BrightnessRows = std::function<void(int32_t y, uint8_t* brightness)>;
 
 Status DitherToMono(Reduction& work, const BrightnessRows& brightnessRow) {
@@ -252,7 +252,7 @@ Status GatherColors(Reduction& work, std::vector<ColorBin>& bins) {
   return Status::Ok;
 }
 
-// Takes the pixels themselves to the colors nearest to them, and the colors to their means.
+// Assigns the pixels to their nearest colors, and moves the colors to their means.
 Status RefineOnPixels(Reduction& work, NearestColor& nearest, ColorPoints& points) {
   const int64_t pixels = static_cast<int64_t>(work.Width()) * work.Height();
   const auto step = static_cast<int32_t>(pixels / kRefinedPixels + 1);
@@ -269,7 +269,7 @@ Status RefineOnPixels(Reduction& work, NearestColor& nearest, ColorPoints& point
   return Status::Ok;
 }
 
-// A palette of at most `most` colors that suits the picture.
+// A palette of at most `most` colors fitted to the picture.
 Status FitToPicture(Reduction& work, int32_t most, NearestColor& nearest, ColorPoints& points) {
   std::vector<ColorBin> bins;
   RETURN_IF_BAD(GatherColors<ColorCells>(work, bins));
@@ -280,7 +280,7 @@ Status FitToPicture(Reduction& work, int32_t most, NearestColor& nearest, ColorP
   return Status::Ok;
 }
 
-// Puts the chosen palette into `work`, and its colors into `nearest`.
+// Stores the chosen palette in `work`, and its colors in `nearest`.
 Status ChoosePalette(Reduction& work, const PaletteChoice& choice, NearestColor& nearest) {
   RETURN_IF_BAD(nearest.Open(true));
   ColorPoints points;
@@ -329,7 +329,7 @@ int32_t HandedOn(int32_t colors) { return colors <= kFew ? kHandedOnFew : kHande
 
 constexpr int32_t DepthOf(int32_t colors) { return colors <= 2 ? 1 : colors <= 16 ? 4 : 8; }
 
-// How many colors a picture has; more than `most`, as most + 1.
+// Counts the colors of a picture; stops at most + 1.
 Status CountColors(const PackedImage& image, int32_t most, int32_t& colors) {
   BgrRows rows;
   RETURN_IF_BAD(rows.Open(image));
@@ -342,7 +342,7 @@ Status CountColors(const PackedImage& image, int32_t most, int32_t& colors) {
   return Status::Ok;
 }
 
-// Whether all colors of the picture fit and need no dithering: then it is as shallow as they allow.
+// Keeps all colors if they fit without dithering, at the smallest depth possible.
 Status KeepFewColors(PictureRecord& picture, int32_t most, bool& kept) {
   int32_t colors = 0;
   RETURN_IF_BAD(CountColors(picture.image, most, colors));
