@@ -1,4 +1,5 @@
-# The libraries that decode and encode pictures and draw text, as `image_libraries` and `image_include_folders`.
+# The libraries that decode and encode pictures and draw text, as `image_libraries` and `image_include_folders`, and which of
+# them are in the program and which it loads, for the program's own list: `linked_libraries`, NAME=VERSION=inside|shared.
 #
 # They are linked statically where the system has them so: loading them would cost every run, and most runs need none.
 # Which archives a static library needs in turn differs between releases; pkg-config knows. Where an archive is missing, or
@@ -39,8 +40,22 @@ int main() {
          fribidi_get_bidi_types();
 }]] STATIC_IMAGE_LIBRARIES_LINK)
 unset(CMAKE_REQUIRED_LIBRARIES)
-if(STATIC_IMAGE_LIBRARIES_LINK)
+if(STATIC_IMAGE_LIBRARIES_LINK AND NOT FOTOMILL_DISTRIBUTION)
   set(image_libraries ${static_set})
+  set(linked_names ${IMAGES_STATIC_LIBRARIES})
 else()
   set(image_libraries ${IMAGES_LINK_LIBRARIES})
+  set(linked_names ${IMAGES_LIBRARIES})
 endif()
+
+list(REMOVE_DUPLICATES linked_names)
+list(REMOVE_ITEM linked_names ${c_library_parts})
+set(linked_libraries "")
+foreach(name IN LISTS linked_names)
+  pkg_search_module(LINKED_${name} QUIET lib${name} ${name} ${name}2)
+  set(how shared)
+  if(STATIC_IMAGE_LIBRARIES_LINK AND NOT FOTOMILL_DISTRIBUTION AND ARCHIVE_${name})
+    set(how inside)
+  endif()
+  string(APPEND linked_libraries "${name}=${LINKED_${name}_VERSION}=${how} ")
+endforeach()

@@ -16,8 +16,26 @@ namespace fotomill {
 
 namespace {
 
-constexpr std::string_view kLetters = "FNCYDTWHPE%";
-constexpr std::string_view kEarly = "FNC%";
+// clang-format off
+constexpr MacroRow kMacros[] = {
+    {'F', true,  "%F",      TrLater("file name without extension")},
+    {'N', true,  "%N",      TrLater("copyright holder: ExifCopyrightHolder, else the user's full name")},
+    {'C', true,  "%C",      TrLater("the copyright sign")},
+    {'Y', false, "%Y",      TrLater("year")},
+    {'D', false, "%D",      TrLater("date when the picture was taken, as 2026-11-22")},
+    {'T', false, "%T",      TrLater("time when the picture was taken, as 14:05:09")},
+    {'W', false, "%W",      TrLater("width in pixels")},
+    {'H', false, "%H",      TrLater("height in pixels")},
+    {'P', false, "%P",      TrLater("page number, from 1")},
+    {'E', false, "%E{Tag}", TrLater("text of an EXIF tag, empty if the picture has none")},
+    {'%', true,  "%%",      TrLater("a percent sign")},
+};
+// clang-format on
+
+const MacroRow* FindMacro(char letter) {
+  const auto found = std::ranges::find(kMacros, letter, &MacroRow::letter);
+  return found != std::end(kMacros) ? found : nullptr;
+}
 
 // The macro at the start of `text`, which begins with "%": its letter, its tag, and how long it is.
 // nullopt when it is none.
@@ -27,7 +45,7 @@ struct Macro {
   size_t length;
 };
 std::optional<Macro> MacroAt(std::string_view text) {
-  if (text.size() < 2 || kLetters.find(text[1]) == std::string_view::npos) return std::nullopt;
+  if (text.size() < 2 || FindMacro(text[1]) == nullptr) return std::nullopt;
   if (text[1] != 'E') return Macro{text[1], {}, 2};
   const size_t end = text.find('}');
   if (text.size() < 3 || text[2] != '{' || end == std::string_view::npos || end == 3)
@@ -223,6 +241,8 @@ size_t UnknownLength(std::string_view text) {
 
 }  // namespace
 
+std::span<const MacroRow> Macros() { return kMacros; }
+
 std::string ExpandMacros(std::string_view text, const MacroFacts& facts,
                          const PictureRecord& picture) {
   return Expand(text, facts, picture, [](std::string value) { return value; });
@@ -260,7 +280,7 @@ bool IsKnownEarly(std::string_view text) {
   Scan(text, [](std::string_view) {},
        [&](std::string_view rest) -> size_t {
          const auto macro = MacroAt(rest);
-         early = early && macro && kEarly.find(macro->letter) != std::string_view::npos;
+         early = early && macro && FindMacro(macro->letter)->early;
          return macro ? macro->length : 1;
        });
   return early;

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <span>
 #include <string>
 #include <string_view>
 
@@ -9,15 +10,15 @@
 
 namespace fotomill {
 
-// Macros in texts and output names:
-//
-//   %F  file name without extension      %W %H  width and height in pixels
-//   %N  copyright holder                 %P     page number, from 1
-//   %C  the copyright sign               %E{Tag}  text of an EXIF tag, empty when the picture has
-//   none %Y  year of the date                 %%     a percent sign %D  date, as 2026-11-22 %T
-//   time, as 14:05:09
-//
-// Date and time are when the picture was taken, else when its file was changed.
+// A macro in texts and output names. Date and time are when the picture was taken, else when its
+// file was changed.
+struct MacroRow {
+  char letter;
+  bool early;           // known before the picture is opened
+  const char* written;  // as people write it
+  const char* help;     // what it becomes, in English
+};
+std::span<const MacroRow> Macros();
 
 // What a run knows beside the picture itself.
 struct MacroFacts {

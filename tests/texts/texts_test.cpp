@@ -50,7 +50,7 @@ TEST(Texts, TablesAreMarkedForTranslation) {
     EXPECT_NE(pot.find(entry), std::string::npos) << "mark it with TrLater and run po/update: " << text;
   };
   for (const cli::Command& command : cli::Commands()) expect(command.summary);
-  for (const cli::Library& library : cli::Libraries()) expect(library.purpose);
+  for (const Library& library : cli::Libraries()) expect(library.purpose);
   for (const FormatSettings* const codec : SettingsOfFormats()) {
     expect(codec->group);
     for (const FormatSetting& setting : codec->keys) {

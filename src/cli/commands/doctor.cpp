@@ -138,7 +138,7 @@ int RunDoctor(const CommandContext& context, bool json) {
   ReportPlugins(output, !context.global.noPlugins);
   for (const Library& library : Libraries()) {
     Report(output, TrLater("Library"),
-           Tr("%1 %2, for %3", library.name, library.version, Tr(library.purpose)));
+           Tr("%1 %2, for %3", library.name, VersionText(library), Tr(library.purpose)));
   }
   ReportFormats(output);
   return kExitOk;

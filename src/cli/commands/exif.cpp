@@ -242,7 +242,9 @@ void SetUpExif(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<ExifOptions>();
   options->selection.takesInput = true;
   AddSelection(app, options->selection, context);
-  AddFlag(app, "--json", options->json, "Print a JSON array with one object per file");
+  AddFlag(app, "--json", options->json,
+          "Print a JSON array of {file, status, message, directories: [{label, entries: [{tag, "
+          "name, type, count, text}]}]}");
   AddName(app, "--thumbnail", options->thumbnail, "OUT|-",
           "Extract the embedded thumbnail to this file, unchanged; - is standard output");
   AddChoice(app, "--overwrite", options->overwrite, "HOW",

@@ -87,7 +87,9 @@ int RunFormats(const FormatsOptions& options, const CommandContext& context) {
 void SetUpFormats(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<FormatsOptions>();
   CLI::Option* json =
-      AddFlag(app, "--json", options->json, "Print a JSON array with one object per format");
+      AddFlag(app, "--json", options->json,
+              "Print a JSON array of {index, extension, description, enabled, flags, maxBits, "
+              "writesPages, childProcess, details, options, startup, read, write, reason}");
   CLI::Option* destinations = AddFlag(app, "--destinations", options->destinations,
                                       "List the output formats, one per line");
   CLI::Option* filter =

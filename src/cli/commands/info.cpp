@@ -150,7 +150,9 @@ void SetUpInfo(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<InfoOptions>();
   options->selection.takesInput = true;
   AddSelection(app, options->selection, context);
-  AddFlag(app, "--json", options->json, "Print a JSON array with one object per file");
+  AddFlag(app, "--json", options->json,
+          "Print a JSON array of {file, status, message, format, index, description, typeName, "
+          "width, height, bitsPerPixel, alpha, fileSize, imageBytes, details, ...}");
   SetFooter(app, nullptr, "fotomill info holiday --recursive --json");
   context.run = [options, &context] { return RunInfo(*options, context); };
 }

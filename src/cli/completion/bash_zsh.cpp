@@ -93,6 +93,7 @@ std::string SharedLists() {
   options += Case("", PrintWords(WordsOf(global)));
   values += ValueCases("", global, lists);
   return "_fotomill_first() {\n  " + PrintWords(FirstWords(commands)) + "\n}\n" +
+         "_fotomill_help() {\n  " + PrintWords(HelpWords(commands)) + "\n}\n" +
          Function("_fotomill_second", second) + Function("_fotomill_options", options) +
          Function("_fotomill_values", values) + Function("_fotomill_arguments", arguments) +
          lists.Functions();
@@ -106,6 +107,8 @@ _fotomill_lines() {
   [[ -n $lines ]] && return
   if [[ $current == -* ]]; then
     lines=$(_fotomill_options "$command")
+  elif [[ -z $command && -n $help ]]; then
+    lines=$(_fotomill_help)
   elif [[ -z $command ]]; then
     lines=$(_fotomill_first)
   elif [[ -n $(_fotomill_second "$command") ]]; then

@@ -85,6 +85,9 @@ function __fotomill_none
     set -l line (string join ' ' -- (__fotomill_words))
     test -z "$line" -o "$line" = help
 end
+function __fotomill_help
+    test (string join ' ' -- (__fotomill_words)) = help
+end
 complete -c fotomill -f
 )fish";
 // clang-format on
@@ -96,7 +99,8 @@ std::string FishCompletion() {
   Lists lists;
   std::string lines;
   const std::vector<Word> first = FirstWords(commands);
-  lines += Line("__fotomill_none") + " -a " + lists.Call(first) + "\n";
+  lines += Line("__fotomill_none; and not __fotomill_help") + " -a " + lists.Call(first) + "\n";
+  lines += Line("__fotomill_help") + " -a " + lists.Call(HelpWords(commands)) + "\n";
   for (const Word& word : first) {
     const std::vector<Word> second = SecondWords(commands, word.text);
     if (!second.empty())

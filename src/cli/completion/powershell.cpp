@@ -72,6 +72,7 @@ constexpr const char* kTail = R"ps(
   $found = $null
   if ($lists.ContainsKey("value:$command $previous")) { $found = $lists["value:$command $previous"] }
   elseif ($current.StartsWith('-')) { $found = $lists["option:$command"] }
+  elseif ($command -eq '' -and $isHelp) { $found = $lists['help'] }
   elseif ($command -eq '') { $found = $lists['first'] }
   elseif ($lists.ContainsKey("second:$command")) { $found = $lists["second:$command"] }
   elseif (-not $isHelp) { $found = $lists["argument:$command"] }
@@ -95,6 +96,7 @@ std::string PowerShellCompletion() {
     if (option.value.goesOn) keys = Pairs(option.value.words);
   }
   lists += Entry("first", Pairs(FirstWords(commands)));
+  lists += Entry("help", Pairs(HelpWords(commands)));
   for (const Word& first : FirstWords(commands)) {
     const std::vector<Word> second = SecondWords(commands, first.text);
     if (!second.empty()) lists += Entry("second:" + first.text, Pairs(second));

@@ -5,6 +5,7 @@
 
 #include "cli/frame/command_parser.h"
 #include "cli/frame/commands.h"
+#include "cli/frame/topics.h"
 #include "core/text.h"
 #include "operations/operations.h"
 #include "registry/registry.h"
@@ -120,7 +121,14 @@ std::vector<Word> FirstWords(const std::vector<CommandWords>& commands) {
     }
     words.push_back({first, help});
   }
-  words.push_back({"help", Tr("explain a command")});
+  words.push_back({"help", Tr("explain a command or a topic")});
+  return words;
+}
+
+std::vector<Word> HelpWords(const std::vector<CommandWords>& commands) {
+  std::vector<Word> words = FirstWords(commands);
+  words.pop_back();
+  for (const Topic& topic : Topics()) words.push_back({topic.name, Tr(topic.summary)});
   return words;
 }
 

@@ -36,6 +36,8 @@ struct CommandWords {
 // All commands, and the words that begin a command line, "help" among them.
 std::vector<CommandWords> AllCommandWords();
 std::vector<Word> FirstWords(const std::vector<CommandWords>& commands);
+// The words that "help" explains: the same but itself, and the topics.
+std::vector<Word> HelpWords(const std::vector<CommandWords>& commands);
 // The second words of a group such as "config"; none for a command of one word.
 std::vector<Word> SecondWords(const std::vector<CommandWords>& commands, const std::string& first);
 // The options before any command.

@@ -2,12 +2,16 @@
 
 #include "cli/frame/command_parser.h"
 #include "cli/frame/commands.h"
-#include "cli/frame/libraries.h"
+#include "cli/frame/shown_text.h"
+#include "cli/frame/topics.h"
+#include "core/utf8.h"
 #include "texts/texts.h"
 
 namespace fotomill::cli {
 
 namespace {
+
+constexpr size_t kPageWidth = 100;
 
 std::string Line(std::string_view left, std::string_view right, size_t width) {
   std::string line("  ");
@@ -28,8 +32,40 @@ std::string ListCommands(std::string_view first) {
     if (!listed) continue;
     list += Line(name, Tr(command.summary), width);
   }
-  if (first.empty()) list += Line("help", Tr("explain a command"), width);
+  if (first.empty()) list += Line("help", Tr("explain a command or a topic"), width);
   return list;
+}
+
+// The text in lines that fit the page, all but the first one indented.
+std::string Wrapped(std::string_view text, size_t indent) {
+  std::string lines;
+  for (const std::string& line : WrappedLines(text, kPageWidth - indent))
+    lines += (lines.empty() ? "" : "\n" + std::string(indent, ' ')) + line;
+  return lines;
+}
+
+// A topic's parts as a page of the terminal.
+std::string TopicPage(const Topic& topic) {
+  const std::vector<TopicPart> parts = topic.parts();
+  size_t width = 0;
+  for (const TopicPart& part : parts) width = std::max(width, CharacterCount(part.left));
+  std::string page = std::string(topic.name) + ": " + Tr(topic.summary) + "\n";
+  bool inList = false;
+  for (const TopicPart& part : parts) {
+    const bool entry = part.kind == TopicPart::Kind::Entry;
+    if (!entry || !inList) page += "\n";
+    inList = entry;
+    if (entry) {
+      page += "  " + part.left + std::string(width + 2 - CharacterCount(part.left), ' ') +
+              Wrapped(part.text, width + 4);
+    } else if (part.kind == TopicPart::Kind::Example) {
+      page += "  " + CLI::detail::find_and_replace(part.text, "\n", "\n  ");
+    } else {
+      page += Wrapped(part.text, 0);
+    }
+    page += "\n";
+  }
+  return page;
 }
 
 }  // namespace
@@ -44,12 +80,17 @@ std::string MainHelp() {
   const auto formatter = std::dynamic_pointer_cast<const CLI::Formatter>(parser.get_formatter());
   page += formatter->make_groups(&parser, CLI::AppFormatMode::Normal);
   page += Line("-V, --version", Tr("Show the versions of the program and its libraries"), 22);
+  page += std::string("\n") + Tr("Topics:") + "\n";
+  for (const Topic& topic : Topics()) page += Line(topic.name, Tr(topic.summary), 22);
   page += "\n" + Tr("Example: %1", "fotomill convert holiday --to png --dest out") + "\n" +
-          Tr("\"%1\" explains a command.", "fotomill help convert") + "\n";
+          Tr("\"%1\" explains a command, \"%2\" a topic.", "fotomill help convert",
+             "fotomill help names") +
+          "\n";
   return page;
 }
 
 std::string HelpOf(std::string_view name) {
+  if (const Topic* topic = FindTopic(name)) return TopicPage(*topic);
   if (const Command* command = FindCommand(name)) {
     CommandContext context;
     return CommandParser(command, context).HelpPage();
@@ -58,13 +99,6 @@ std::string HelpOf(std::string_view name) {
   if (list.empty() || name.empty()) return {};
   return Tr("Usage: %1", "fotomill " + std::string(name) + " COMMAND [ARGUMENT]...") + "\n\n" +
          Tr("Commands:") + "\n" + list;
-}
-
-std::string VersionPage() {
-  std::string page = "Fotomill Professional " FOTOMILL_VERSION "\n";
-  for (const Library& library : Libraries())
-    page += std::string(library.name) + " " + library.version + "\n";
-  return page;
 }
 
 }  // namespace fotomill::cli

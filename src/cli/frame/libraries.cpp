@@ -1,14 +1,9 @@
 #include "cli/frame/libraries.h"
 
-#include <lcms2.h>
-
 #include <CLI/Version.hpp>
 #include <nlohmann/json.hpp>
 #include <string>
 #include <vector>
-
-#include "registry/registry.h"
-#include "texts/texts.h"
 
 namespace fotomill::cli {
 
@@ -19,22 +14,22 @@ namespace {
   FOTOMILL_QUOTED(major) "." FOTOMILL_QUOTED(minor) "." FOTOMILL_QUOTED(patch)
 #define FOTOMILL_VERSION_OF(major, minor, patch) FOTOMILL_QUOTED_NUMBERS(major, minor, patch)
 
-// 2140 stands for 2.14.
-std::string LcmsVersion() {
-  return std::to_string(LCMS_VERSION / 1000) + "." + std::to_string(LCMS_VERSION % 1000 / 10);
-}
+#ifdef FOTOMILL_STATIC_RUNTIME
+constexpr Linking kRuntime = Linking::Inside;
+#else
+constexpr Linking kRuntime = Linking::Shared;
+#endif
 
 std::vector<Library> MakeLibraries() {
-  std::vector<Library> libraries = {
-      {"CLI11", CLI11_VERSION, TrLater("the command line")},
+  const OwnLibrary own[] = {
+      {"CLI11", CLI11_VERSION, Linking::Inside},
       {"nlohmann-json",
-       FOTOMILL_VERSION_OF(NLOHMANN_JSON_VERSION_MAJOR, NLOHMANN_JSON_VERSION_MINOR, NLOHMANN_JSON_VERSION_PATCH),
-       TrLater("results as JSON")},
+       FOTOMILL_VERSION_OF(NLOHMANN_JSON_VERSION_MAJOR, NLOHMANN_JSON_VERSION_MINOR,
+                           NLOHMANN_JSON_VERSION_PATCH),
+       Linking::Inside},
+      {"libstdc++", FOTOMILL_VERSION_OF(__GNUC__, __GNUC_MINOR__, __GNUC_PATCHLEVEL__), kRuntime},
   };
-  for (const FormatLibrary& library : LibrariesOfFormats())
-    libraries.push_back({library.name, library.version(), library.purpose});
-  libraries.push_back({"lcms2", LcmsVersion(), TrLater("color profiles, in the desktop program")});
-  return libraries;
+  return LibrariesOf(own);
 }
 
 }  // namespace
@@ -42,6 +37,11 @@ std::vector<Library> MakeLibraries() {
 std::span<const Library> Libraries() {
   static const std::vector<Library> libraries = MakeLibraries();
   return libraries;
+}
+
+std::string VersionText(const Library& library) {
+  if (!library.version.empty()) return library.version;
+  return library.present ? "present" : "missing";
 }
 
 }  // namespace fotomill::cli

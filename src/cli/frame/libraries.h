@@ -1,18 +1,15 @@
 #pragma once
 
 #include <span>
-#include <string>
+
+#include "registry/about.h"
 
 namespace fotomill::cli {
 
-// A library that the program is linked with or loads.
-struct Library {
-  const char* name;
-  std::string version;
-  const char* purpose;  // in English
-};
-
-// All of them, for the version page and "doctor".
+// The libraries of the command line program, for the version page and "doctor".
 std::span<const Library> Libraries();
+
+// A library's version as people read it; without one, whether the library is there.
+std::string VersionText(const Library& library);
 
 }  // namespace fotomill::cli

@@ -7,6 +7,8 @@
 #include "cli/frame/command_parser.h"
 #include "cli/frame/commands.h"
 #include "cli/frame/options.h"
+#include "cli/frame/topics.h"
+#include "core/text.h"
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "texts/system_reason.h"
@@ -83,10 +85,25 @@ std::string OptionSections(const CLI::App& parser) {
 }
 
 std::string ExitStatusSection() {
-  return Section(Tr("EXIT STATUS")) + Entry("0", "", Tr("Everything was done.")) +
-         Entry("1", "", Tr("A file failed, or nothing was found.")) +
-         Entry("2", "", Tr("The command line is wrong; nothing was touched.")) +
-         Entry("130, 143", "", Tr("Stopped by SIGINT or SIGTERM."));
+  std::string text = Section(Tr("EXIT STATUS"));
+  for (const TopicPart& part : ExitStatusEntries()) text += Entry(part.left, "", part.text);
+  return text;
+}
+
+// A section for each topic of the help.
+std::string TopicSections() {
+  std::string text;
+  for (const Topic& topic : Topics()) {
+    text += Section(Roff(UpperCase(topic.name)));
+    for (const TopicPart& part : topic.parts()) {
+      switch (part.kind) {
+        case TopicPart::Kind::Paragraph: text += ".PP\n" + Roff(part.text) + "\n"; break;
+        case TopicPart::Kind::Entry: text += Entry(part.left, "", part.text); break;
+        case TopicPart::Kind::Example: text += ".PP\n.EX\n" + Roff(part.text) + "\n.EE\n"; break;
+      }
+    }
+  }
+  return text;
 }
 
 std::string SeeAlsoSection(std::string_view page) {
@@ -129,7 +146,7 @@ std::string MainPage() {
               "fotomill apply photos --do 'resize 1600x1600; sharpen 0.5' --dest web\n"
               "fotomill rename --help") +
           "\n.EE\n";
-  return text + ExitStatusSection() + SeeAlsoSection("fotomill-convert");
+  return text + TopicSections() + SeeAlsoSection("fotomill-convert");
 }
 
 int WriteManual(const std::string& folder, const CommandContext& context) {

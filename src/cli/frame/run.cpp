@@ -11,6 +11,8 @@
 #include "cli/frame/commands.h"
 #include "cli/frame/help.h"
 #include "cli/frame/prepare.h"
+#include "cli/frame/topics.h"
+#include "cli/frame/version.h"
 #include "core/shown_text.h"
 #include "platform/process.h"
 #include "texts/name_hint.h"
@@ -74,6 +76,7 @@ CommandName NameOfCommand(const Arguments& arguments, size_t place) {
 int RefuseCommand(const std::string& name, const Io& io) {
   std::vector<std::string_view> names{"help"};
   for (const Command& command : Commands()) names.emplace_back(command.name);
+  for (const Topic& topic : Topics()) names.emplace_back(topic.name);
   return Complain(io, Tr("Unknown command \"%1\".", name) + NearestNameHint(name, names));
 }
 
@@ -142,6 +145,28 @@ int RefuseLanguage(const std::string& code, const Io& io) {
   return Complain(io, Tr("There is no translation \"%1\"; there are: %2.", code, list));
 }
 
+// The page of --version; its own options may stand before and behind it.
+int PrintVersion(Arguments arguments, const Io& io) {
+  VersionOptions options;
+  std::erase_if(arguments, [&](const std::string& argument) {
+    const bool json = argument == "--json", licenses = argument == "--licenses";
+    options.json = options.json || json;
+    options.licenses = options.licenses || licenses;
+    return json || licenses || IsAnyOf(argument, "-V", "--version");
+  });
+  CommandContext context;
+  try {
+    CommandParser(nullptr, context).ParseArguments(std::move(arguments));
+  } catch (const CLI::CallForHelp&) {
+    Print(io.out, MainHelp());
+    return kExitOk;
+  } catch (const CLI::ParseError& error) {
+    return Complain(io, error.what());
+  }
+  Print(io.out, VersionPage(options));
+  return kExitOk;
+}
+
 int Dispatch(Arguments arguments, const Io& io) {
   const std::string language = WantedLanguage(arguments);
   if (!StartTexts(language)) return RefuseLanguage(language, io);
@@ -151,8 +176,8 @@ int Dispatch(Arguments arguments, const Io& io) {
     if (GlobalOptionTakesValue(arguments[i])) {
       ++i;
     } else if (IsAnyOf(arguments[i], "-V", "--version")) {
-      Print(io.out, VersionPage());
-      return kExitOk;
+      if (place) arguments.resize(*place);
+      return PrintVersion(std::move(arguments), io);
     } else if (!place && IsAnyOf(arguments[i], "-h", "--help")) {
       Print(io.out, MainHelp());
       return kExitOk;
