@@ -7,6 +7,25 @@ Fail() {
   exit 1
 }
 
+# As CMake knows it.
+ProjectVersion() { sed -nE 's/^project\(fotomill VERSION ([0-9.]+).*/\1/p' "$root/CMakeLists.txt"; }
+
+# CopyTree FROM TO: the files that git knows, with the changes that are not committed; without git, all but build/.
+CopyTree() {
+  if git -C "$1" rev-parse --is-inside-work-tree >/dev/null 2>&1; then
+    git -C "$1" ls-files -z --cached --others --exclude-standard |
+      (cd "$1" && while IFS= read -r -d '' file; do [[ -e $file || -L $file ]] && printf '%s\0' "$file"; done)
+  else
+    (cd "$1" && find . -path ./build -prune -o \( -type f -o -type l \) -printf '%P\0')
+  fi | tar -C "$1" --null -T - -cf - | tar -C "$2" --no-same-owner -xf -
+}
+
+# ArchiveTree FOLDER NAME FILE: FOLDER/NAME as an archive whose bytes depend on the files alone, dated SOURCE_DATE_EPOCH.
+ArchiveTree() {
+  tar -C "$1" --sort=name --mtime="@$SOURCE_DATE_EPOCH" --owner=0 --group=0 --numeric-owner --mode=u+rw,go=u-w \
+    --format=gnu -cf - "$2" | xz -6 -T1 >"$3"
+}
+
 # The packages of the given groups, one a line; alternatives as a|b.
 PackagesOf() {
   local line group='' wanted=" $* "
