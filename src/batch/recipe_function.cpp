@@ -1,9 +1,12 @@
 #include "batch/recipe_function.h"
 
 #include <algorithm>
+#include <utility>
 
+#include "metadata/exif/picture_exif.h"
 #include "operations/engine.h"
 #include "platform/files.h"
+#include "registry/registry.h"
 #include "texts/texts.h"
 
 namespace fotomill {
@@ -31,6 +34,32 @@ struct RecipeRun {
                        .faces = faces});
   }
 };
+
+// The step that gets the decoded picture, where only one does.
+const Step* FirstStep(const Recipe& recipe) {
+  if (!recipe.common.empty()) return &recipe.common.front();
+  const bool one = recipe.outputs.size() == 1 && !recipe.outputs.front().steps.empty();
+  return one ? &recipe.outputs.front().steps.front() : nullptr;
+}
+
+// How much of a picture the first step needs, see ReadRequest::thumbnailSide.
+int32_t DecodedSide(const Step& first, const PictureRecord& facts) {
+  constexpr int32_t kLeastEdge = 512;  // smaller pictures are decoded in no time
+  constexpr int32_t kBlock = 8;  // a reduced decode of other sizes has partial pixels at its end
+  // JPEG files only: the smaller pictures that other formats hold need not look like the large one.
+  if (facts.formatIndex == kNoFormat || !FormatRow(facts.formatIndex).turnsWithoutLoss) return 0;
+  if ((facts.unread & kUnreadInks) != 0) return 0;  // the mean of inks is not that of their colors
+  if (std::max(facts.width, facts.height) < kLeastEdge) return 0;
+  const Orientation orientation = OrientationOf(facts);
+  const bool whole = facts.width % kBlock == 0 && facts.height % kBlock == 0;
+  if (orientation != Orientation::Upright && !whole) return 0;  // which would come to the front
+  Size size{facts.width, facts.height};
+  if (SwapsSides(orientation)) {
+    if (facts.metadata.dpiX != facts.metadata.dpiY) return 0;  // these change places as well
+    std::swap(size.width, size.height);
+  }
+  return first.operation->decodedSide(first.arguments, size, facts.metadata);
+}
 
 bool HasQuality(std::string_view extension) { return extension == "JPG" || extension == "WEBP"; }
 
@@ -65,6 +94,11 @@ std::string SetRecipe(std::shared_ptr<const Recipe> recipe, const std::string& c
     return run->Apply(picture, run->recipe->common);
   };
   function.autoOrient = function.autoOrient || recipe->HasSteps();
+  const Step* const first = FirstStep(*recipe);
+  if (first != nullptr && first->operation->decodedSide != nullptr)
+    function.decodedSide = [run, first](const PictureRecord& facts) {
+      return DecodedSide(*first, facts);
+    };
   for (size_t i = 0; i < recipe->outputs.size(); ++i) {
     const RecipeOutput& wanted = recipe->outputs[i];
     BatchOutput& output = function.outputs.emplace_back();

@@ -296,6 +296,7 @@ class Batch {
     RETURN_IF_BAD(LoadPictureInfo(request, picture));
     request.page = picture->page = page - 1;
     if (IsOnlyPlanned()) return page > picture->pageCount ? Status::NoImages : Status::Ok;
+    if (function_.decodedSide) request.thumbnailSide = function_.decodedSide(*picture);
     RETURN_IF_BAD(ReadPicture(request, *picture));
     const bool turns = function_.autoOrient && !writer_.TurnsItself();
     return turns ? TurnUpright(*picture) : Status::Ok;

@@ -32,6 +32,8 @@ struct BatchFunction {
   // Changes the decoded picture; empty for plain conversion. Called on several threads at once,
   // with different pictures.
   std::function<Status(PictureRecord& picture)> transform = {};
+  // ReadRequest::thumbnailSide for a picture whose facts are known; empty: every pixel is needed
+  std::function<int32_t(const PictureRecord& facts)> decodedSide = {};
   // each file is decoded once for all of them; none: one, as the job says
   std::vector<BatchOutput> outputs = {};
   // for jobs without a format: of sources whose own cannot be written

@@ -79,8 +79,10 @@ Status CopyPicture(const PictureRecord& picture, PictureRecord& copy) {
   if (!picture.alpha.Empty()) RETURN_IF_BAD(CutImage(picture.alpha, all, copy.alpha));
   copy.fileName = picture.fileName;
   copy.typeName = picture.typeName;
-  copy.width = picture.image.Width();
-  copy.height = picture.image.Height();
+  const Size size = FullSizeOf(picture);
+  copy.width = size.width;
+  copy.height = size.height;
+  copy.reduction = picture.reduction;
   copy.bitsPerPixel = picture.image.Bits();
   copy.defaultColour = picture.defaultColour;
   copy.fileSize = picture.fileSize;

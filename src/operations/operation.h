@@ -79,6 +79,11 @@ using CheckFunction = ArgumentProblem (*)(const Arguments& arguments);
 
 // Whether an operation with these arguments moves or cuts off pixels and gives none another color.
 using MovesFunction = bool (*)(const Arguments& arguments);
+// The side of the square that an operation needs a picture for when it comes first: a decoder may
+// deliver any smaller size whose longer edge is at least twice this. `whole` is the picture's own
+// size. 0: every pixel counts.
+using DecodedSideFunction = int32_t (*)(const Arguments& arguments, Size whole,
+                                        const PictureMetadata& metadata);
 
 // One operation: a constant row.
 struct Operation {
@@ -94,6 +99,7 @@ struct Operation {
   ReachFunction reach = nullptr;  // neighborhood operations
   CheckFunction check = nullptr;  // may be missing
   MovesFunction moves = nullptr;  // missing: it never does
+  DecodedSideFunction decodedSide = nullptr;  // may be missing: every pixel counts
 };
 
 }  // namespace fotomill

@@ -64,7 +64,7 @@ def limits(work):
 def reduced(work):
     """What is decoded smaller is within 3 levels of what is not; a first step that changes nothing keeps it from being so."""
     for source in ("a.jpg", "odd.jpg", "turned.jpg"):
-        for line in ("resize 300", "resize 12%", "resize 200x200 fill", "resize 250x80 stretch filter=lanczos3", "resize 100 filter=box"):
+        for line in ("resize 300", "resize 12%", "resize 200x200 fill", "resize 250x80 stretch filter=lanczos3", "resize 100 filter=mitchell"):
             pictures = []
             for i, steps in enumerate((line, "offset 0 0; " + line)):
                 target = work / f"{i}.png"

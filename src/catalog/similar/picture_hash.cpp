@@ -94,11 +94,8 @@ Levels LevelsOf(const PackedImage& image, const PackedImage& alpha, Color backgr
 
 Status HashPicture(const PictureRecord& picture, PictureHashes& hashes) {
   if (picture.image.Empty()) return Status::EmptyImage;
-  const int32_t reduction = std::max(picture.reduction, 1);
-  const Reach reach{std::min<double>(picture.image.Width(), 1.0 * picture.width / reduction),
-                    std::min<double>(picture.image.Height(), 1.0 * picture.height / reduction)};
   PackedImage small, alpha;
-  RETURN_IF_BAD(ScaleFiltered(picture.image, picture.alpha, reach, {kSide, kSide},
+  RETURN_IF_BAD(ScaleFiltered(picture.image, picture.alpha, ReachOf(picture), {kSide, kSide},
                               ScaleOptions{.filter = ScaleFilter::Bilinear}, small, alpha));
   const Coefficients own = Transformed(LevelsOf(small, alpha, picture.defaultColour));
   for (size_t i = 0; i < hashes.size(); ++i)

@@ -33,21 +33,12 @@ Status ScaleQuickly(const PictureRecord& picture, ScaledPicture& scaled) {
   return picture.alpha.Empty() ? Status::Ok : ScaleNearest(picture.alpha, size, scaled.alpha);
 }
 
-// How far a picture reaches in its image, by one edge of each. An image that is no reduction of it
-// is all of it.
-double ReachOf(int32_t pictureEdge, int32_t imageEdge, int32_t reduction) {
-  const double reach = static_cast<double>(pictureEdge) / reduction;
-  return reduction > 1 && reach > imageEdge - 1 && reach < imageEdge ? reach : imageEdge;
-}
-
 Status ScaleToFit(const PictureRecord& picture, ScaledPicture& scaled) {
   const int32_t width = picture.image.Width(), height = picture.image.Height();
   const bool reduced = picture.width > width || picture.height > height;
   const Size size = reduced ? FitSize(picture.width, picture.height, kSmallThumbnailSide)
                             : FitSize(width, height, kSmallThumbnailSide);
-  const Reach reach{ReachOf(picture.width, width, picture.reduction),
-                    ReachOf(picture.height, height, picture.reduction)};
-  return ScaleFiltered(picture.image, picture.alpha, reach, size, ScaleFilter::Lanczos,
+  return ScaleFiltered(picture.image, picture.alpha, ReachOf(picture), size, ScaleFilter::Lanczos,
                        scaled.image, scaled.alpha);
 }
 

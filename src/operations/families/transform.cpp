@@ -118,8 +118,22 @@ bool IsKept(const Arguments& arguments, Size picture, Size scaled) {
   return arguments.Choice<Only>("only") == Only::Shrink ? grows : shrinks;
 }
 
+// A picture that shrinks to half and less may be decoded smaller: smooth filters make the same of it
+// within a few levels. Nearest and box pick whole pixels, and light adds up otherwise than levels.
+int32_t ResizeSide(const Arguments& arguments, Size whole, const PictureMetadata& metadata) {
+  const ScaleFilter filter = kFilters[arguments.Choice("filter")];
+  if (arguments.Flag("linear") || filter == ScaleFilter::Nearest || filter == ScaleFilter::Box)
+    return 0;
+  const Size scaled =
+      TargetOf(arguments.Of("size"), arguments.Choice<Mode>("mode"), whole, metadata).scaled;
+  if (IsKept(arguments, whole, scaled)) return 0;
+  const double factor = std::max(static_cast<double>(scaled.width) / whole.width,
+                                 static_cast<double>(scaled.height) / whole.height);
+  return factor > 0.5 ? 0 : Whole(std::ceil(factor * std::max(whole.width, whole.height)));
+}
+
 Status Resize(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
-  const Size whole{picture.image.Width(), picture.image.Height()};
+  const Size whole = FullSizeOf(picture);
   const auto mode = arguments.Choice<Mode>("mode");
   Target target = TargetOf(arguments.Of("size"), mode, whole, picture.metadata);
   if (IsKept(arguments, whole, target.scaled)) {
@@ -325,7 +339,8 @@ constexpr Operation kOperations[] = {
      .example = "resize 800x600 filter=lanczos3",
      .parameters = kResize,
      .works = Works::Geometry,
-     .apply = Resize},
+     .apply = Resize,
+     .decodedSide = ResizeSide},
     {.name = "rotate",
      .family = Family::Transform,
      .label = "Rotate",

@@ -46,9 +46,34 @@ void Replace(PictureRecord& picture, PackedImage& image, PackedImage& alpha) {
   picture.width = picture.image.Width();
   picture.height = picture.image.Height();
   picture.bitsPerPixel = picture.image.Bits();
+  picture.reduction = 1;
+}
+
+// Whether an edge of a picture became that edge of its image.
+bool IsReduced(int32_t edge, int32_t imageEdge, int32_t reduction) {
+  return reduction > 1 && (int64_t{edge} + reduction - 1) / reduction == imageEdge;
+}
+
+bool IsReduced(const PictureRecord& picture) {
+  return IsReduced(picture.width, picture.image.Width(), picture.reduction) &&
+         IsReduced(picture.height, picture.image.Height(), picture.reduction);
 }
 
 }  // namespace
+
+Reach ReachOf(const PictureRecord& picture) {
+  if (!IsReduced(picture)) {
+    return {static_cast<double>(picture.image.Width()),
+            static_cast<double>(picture.image.Height())};
+  }
+  return {static_cast<double>(picture.width) / picture.reduction,
+          static_cast<double>(picture.height) / picture.reduction};
+}
+
+Size FullSizeOf(const PictureRecord& picture) {
+  return IsReduced(picture) ? Size{picture.width, picture.height}
+                            : Size{picture.image.Width(), picture.image.Height()};
+}
 
 Size FitSize(int32_t width, int32_t height, int32_t side) {
   const int64_t longer = std::max({width, height, 1});
@@ -116,10 +141,9 @@ Status ScalePictureByPercentage(PictureRecord& picture, int32_t percentage) {
 
 Status ScalePicture(PictureRecord& picture, Size size, const ScaleOptions& options) {
   if (picture.image.Empty()) return Status::EmptyImage;
-  const Reach all{static_cast<double>(picture.image.Width()),
-                  static_cast<double>(picture.image.Height())};
   PackedImage image, alpha;
-  RETURN_IF_BAD(ScaleFiltered(picture.image, picture.alpha, all, size, options, image, alpha));
+  RETURN_IF_BAD(ScaleFiltered(picture.image, picture.alpha, ReachOf(picture), size, options, image,
+                              alpha));
   Replace(picture, image, alpha);
   return Status::Ok;
 }

@@ -61,6 +61,11 @@ Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Size si
 struct Reach {
   double width, height;  // in pixels of the image
 };
+// Of a record: width and height divided by `reduction`; the whole image unless it is a reduced
+// decode.
+Reach ReachOf(const PictureRecord& picture);
+// Width and height of the picture itself, even if `image` is a reduced decode.
+Size FullSizeOf(const PictureRecord& picture);
 Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Reach reach, Size size,
                      ScaleFilter filter, PackedImage& scaled, PackedImage& scaledAlpha,
                      ProgressSink* progress = nullptr);
@@ -77,8 +82,8 @@ struct ScaleOptions {
 // As above, in bands, with options. FunctionCancelled (4) if the work was stopped.
 Status ScaleFiltered(const PackedImage& image, const PackedImage& alpha, Reach reach, Size size,
                      const ScaleOptions& options, PackedImage& scaled, PackedImage& scaledAlpha);
-// As above, for a picture; sets `width`, `height` and `bitsPerPixel`. On failure the
-// picture is unchanged.
+// As above, for a picture, which may be a reduced decode; sets `width`, `height` and
+// `bitsPerPixel`. On failure the picture is unchanged.
 Status ScalePicture(PictureRecord& picture, Size size, const ScaleOptions& options);
 
 // As above, with a filter and default
