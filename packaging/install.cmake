@@ -28,6 +28,10 @@ install(FILES ${printed}/fish DESTINATION ${CMAKE_INSTALL_DATADIR}/fish/vendor_c
 # Beside the libraries of no architecture's own folder: the program looks for ../lib/fotomill/plugin from where it lies.
 install(TARGETS FMWPL_pnm LIBRARY DESTINATION lib/fotomill/plugin COMPONENT plugins)
 
+# What authors of plug-ins begin with.
+install(FILES ${PROJECT_SOURCE_DIR}/src/plugins/fotomill_plugin.h ${PROJECT_SOURCE_DIR}/samples/plugin/pnm.c
+        DESTINATION ${CMAKE_INSTALL_DATADIR}/doc/fotomill/examples COMPONENT plugins)
+
 if(TARGET fotomill-faces)
   install(TARGETS fotomill-faces LIBRARY DESTINATION lib/fotomill COMPONENT plugins)
 endif()
@@ -35,6 +39,7 @@ endif()
 if(TARGET fotomill-desktop)
   set(desktop_files ${packaging_folder}/desktop)
   install(TARGETS fotomill-desktop DESTINATION ${CMAKE_INSTALL_BINDIR} COMPONENT desktop)
+  install(FILES ${desktop_files}/fotomill-desktop.1 DESTINATION ${CMAKE_INSTALL_MANDIR}/man1 COMPONENT desktop)
   install(FILES ${desktop_files}/fotomill-desktop.desktop DESTINATION ${CMAKE_INSTALL_DATADIR}/applications COMPONENT desktop)
   install(FILES ${desktop_files}/fotomill-desktop.metainfo.xml DESTINATION ${CMAKE_INSTALL_DATADIR}/metainfo COMPONENT desktop)
   install(FILES ${desktop_files}/fotomill-formats.xml DESTINATION ${CMAKE_INSTALL_DATADIR}/mime/packages COMPONENT desktop)

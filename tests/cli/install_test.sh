@@ -39,7 +39,7 @@ Expect "what it wrote" "2x1" "$("$prefix/bin/fotomill" info --json "$work/a.bmp"
 commands=$("$prefix/bin/fotomill" help | sed -nE '/^Commands/,/^$/ s/^  ([a-z -]+[a-z])  .*/\1/p' |
   grep -vx help | tr ' ' '-' | sort)
 Expect "a page a command" "$commands" \
-  "$(ls "$prefix/share/man/man1" | sed -nE 's/^fotomill-(.*)\.1$/\1/p' | sort)"
+  "$(ls "$prefix/share/man/man1" | sed -nE 's/^fotomill-(.*)\.1$/\1/p' | grep -vx desktop | sort)"
 Expect "the main page" "*.SH \"COMMANDS\"*convert*" "$(<"$prefix/share/man/man1/fotomill.1")"
 if command -v groff >/dev/null; then
   Expect "pages are clean" "" "$(groff -man -Tutf8 -ww -z "$prefix"/share/man/man1/*.1 2>&1)"
@@ -50,7 +50,7 @@ for file in bash-completion/completions/fotomill zsh/site-functions/_fotomill \
 done
 
 if [[ -x $prefix/bin/fotomill-desktop ]]; then
-  for file in applications/fotomill-desktop.desktop icons/hicolor/scalable/apps/fotomill-desktop.svg \
+  for file in man/man1/fotomill-desktop.1 applications/fotomill-desktop.desktop icons/hicolor/scalable/apps/fotomill-desktop.svg \
     mime/packages/fotomill-formats.xml thumbnailers/fotomill.thumbnailer metainfo/fotomill-desktop.metainfo.xml; do
     Expect "$file" "yes" "$([[ -s $prefix/share/$file ]] && echo yes)"
   done

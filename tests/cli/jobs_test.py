@@ -50,8 +50,20 @@ def jobs():
             yield line.strip()
 
 
+def examples():
+    """The command lines of the README, without their comments."""
+    readme = (PROJECT / "README.md").read_text(encoding="utf-8")
+    for line in readme.split("\n## Ten examples\n")[1].split("\n## ")[0].splitlines():
+        if line.startswith("    "):
+            yield line.split("  #")[0].strip()
+
+
 def main():
     failures, count = 0, 0
+    shown = list(examples())
+    if len(shown) != 10 or not set(shown) <= set(jobs()):
+        failures += 1
+        print("examples of the README that are not in docs/user/jobs.md:", set(shown) - set(jobs()))
     with tempfile.TemporaryDirectory() as name:
         folder = Path(name)
         prepare(folder)
