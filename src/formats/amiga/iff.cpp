@@ -1,29 +1,28 @@
 // Amiga interchange files (IFF) with an interleaved bitmap (ILBM) or a packed one (PBM),
 // big-endian.
 //
-//   "FORM", bytes of what follows (4), "ILBM" or "PBM ", then chunks: name (4), bytes (4), data
-//   padded to an even length
+//   "FORM", size of the rest (4), "ILBM" or "PBM ", then chunks: name (4), size (4), data padded to
+//   an even length
 //
-//   BMHD  width, height (2 each), origin (4), planes, masking (0 none, 1 a plane of its own, 2
-//   transparent color, 3 lasso),
-//         compression (0 none, 1 ByteRun1), nothing, transparent color (2), pixel aspect x and y,
-//         size of the page (4)
+//   BMHD  width, height (2 each), origin (4), planes, masking (0 none, 1 a mask plane, 2
+//         transparent color, 3 lasso), compression (0 none, 1 ByteRun1), padding, transparent color
+//         (2), pixel aspect x and y, page size (4)
 //   CMAP  colors: red, green, blue
 //   CAMG  screen mode (4): 0x800 hold and modify (HAM), 0x80 extra half-bright (EHB)
-//   GRAB  a brush's handle: x, y (2 each)
+//   GRAB  hot spot of a brush: x, y (2 each)
 //   DPI   resolution: x, y (2 each)
 //   ANNO, AUTH, NAME, "(c) "  texts
-//   BODY  ILBM: the planes of each row, ceil(width / 16) x 2 bytes each, and the mask's; PBM: bytes
-//   of even rows
+//   BODY  ILBM: for each row its planes, ceil(width / 16) x 2 bytes each, and the mask's; PBM: rows
+//         padded to an even size
 //
-// Up to 8 planes are indices; 24 and 32 are the bits of red, green, blue (alpha), lowest first. HAM
-// of 6 planes modifies 4 bits, HAM of 8 planes 6 bits, which are repeated to fill a byte. EHB has
-// 32 colors and their halves. Mask and transparent color become alpha. Colors of 4 bits, which old
-// programs stored in the high half of a byte, are spread over it. Six planes without a screen mode
-// are HAM with up to 16 colors, EHB with up to 32.
+// Up to 8 planes are palette indices; 24 and 32 are the bits of red, green, blue (alpha), lowest
+// first. HAM with 6 planes modifies 4 bits, with 8 planes 6 bits, which are replicated to fill a
+// byte. EHB has 32 colors and the same at half brightness. Mask and transparent color become alpha.
+// 4-bit colors, which old programs stored in the high half of a byte, are scaled to 8 bits. Six
+// planes without a screen mode are HAM with up to 16 colors, EHB with up to 32.
 //
-// The writer makes ILBM of 1, 4, 8 or 24 planes, PBM of palette pictures with CreateIffPBM, in
-// ByteRun1 unless CreateIffCompressed is off. Source: J. Morrison, "EA IFF 85: Standard for
+// The writer creates ILBM with 1, 4, 8 or 24 planes, or PBM for palette pictures with CreateIffPBM,
+// with ByteRun1 unless CreateIffCompressed is off. Source: J. Morrison, "EA IFF 85: Standard for
 // Interchange Format Files" and "ILBM: IFF Interleaved Bitmap" (Electronic Arts, 1985, 1986);
 // "Amiga ROM Kernel Reference Manual: Devices", 3rd edition (1991).
 #include "formats/amiga/iff.h"
@@ -44,10 +43,10 @@ namespace {
 
 constexpr uint32_t kHamMode = 0x800, kHalfBriteMode = 0x80;
 constexpr uint8_t kMaskPlane = 1, kTransparentColor = 2;
-constexpr uint64_t kBestRatio = 64;  // ByteRun1 makes 128 bytes of 2
+constexpr uint64_t kBestRatio = 64;  // ByteRun1 packs at best 128 bytes into 2
 
 struct IffFile {
-  bool packed = false;  // PBM: a byte a pixel
+  bool packed = false;  // PBM: one byte per pixel
   int32_t width = 0, height = 0;
   int32_t planes = 0;
   uint8_t masking = 0, compression = 0;
@@ -80,7 +79,7 @@ struct IffFile {
     const auto pixels = static_cast<size_t>(width);
     return packed ? (pixels + 1) / 2 * 2 : (pixels + 15) / 16 * 2;
   }
-  // Planes that a row is stored in, the bytes of a packed row counting as one.
+  // Number of stored planes per row; a PBM row counts as one.
   size_t StoredPlanes() const {
     return (packed ? 1 : static_cast<size_t>(planes)) + (masking == kMaskPlane ? 1 : 0);
   }
@@ -202,7 +201,7 @@ void DescribePicture(const IffFile& file, PictureRecord& picture) {
     picture.warning.AssignCut(TrLater("Colors that change from row to row are not shown."));
 }
 
-// Stores indices of one byte at the image's depth.
+// Packs one-byte indices to the image's depth.
 void PackIndices(std::span<const uint8_t> pixels, int32_t bits, std::span<uint8_t> row) {
   if (bits == 8) {
     std::ranges::copy(pixels, row.begin());
@@ -216,7 +215,7 @@ void PackIndices(std::span<const uint8_t> pixels, int32_t bits, std::span<uint8_
   }
 }
 
-// Makes rows of the picture out of what is stored.
+// Converts stored rows to rows of the picture.
 class RowMaker {
  public:
   explicit RowMaker(const IffFile& file)
@@ -267,7 +266,7 @@ class RowMaker {
 
   const IffFile& file_;
   const size_t planeSize_;
-  std::vector<uint8_t> pixels_;  // a row of indices, or of each color
+  std::vector<uint8_t> pixels_;  // one row of indices, or of each color
   Palette hamColors_{};
 };
 

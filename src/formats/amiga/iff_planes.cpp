@@ -10,7 +10,7 @@ namespace {
 
 using Spread = std::array<std::array<uint8_t, 8>, 256>;
 
-// The bits of each byte as bytes of 0 or 1, from the highest down.
+// The bits of each byte, expanded to bytes of 0 or 1, highest first.
 constexpr Spread MakeSpread() {
   Spread spread{};
   for (size_t byte = 0; byte < spread.size(); ++byte) {
@@ -57,7 +57,7 @@ void DecodeHam(std::span<const uint8_t> pixels, int32_t bits, const uint8_t* col
   const int32_t valueBits = bits > 6 ? 6 : 4;
   const uint8_t mask = static_cast<uint8_t>((1 << valueBits) - 1);
   uint8_t color[3] = {colors[2], colors[1], colors[0]};
-  // which of blue, green, red a control of 1 to 3 replaces
+  // the channel (blue, green, red) replaced by control values 1 to 3
   constexpr size_t kPlace[] = {0, 0, 2, 1};
   for (const uint8_t pixel : pixels) {
     const uint8_t value = pixel & mask;

@@ -1,4 +1,4 @@
-// The writer of Amiga interchange files. Its choices are described in iff.cpp.
+// The writer of Amiga interchange files; see iff.cpp.
 #include <algorithm>
 #include <array>
 #include <memory>
@@ -27,8 +27,8 @@ struct IffLayout {
   bool compressed = true;
 };
 
-// Pixels of three bytes in hold-and-modify of eight bits: each takes whichever comes nearest of a
-// color of the palette and the pixel to the left with blue, red or green replaced.
+// Encodes 24-bit pixels as HAM8: each uses the closest of a palette color and the pixel to the left
+// with blue, red or green replaced.
 class HamEncoder {
  public:
   // Fits the palette to the picture. MemoryAllocationError.
@@ -38,8 +38,7 @@ class HamEncoder {
     for (int32_t y = 0; y < image.Height(); ++y) cells.AddRow(image.Row(y).data(), image.Width());
     ColorPoints points;
     RETURN_IF_BAD(FitPalette(cells.Bins(), kHamColors - 1, points));
-    // Rows begin with the first color, as the hardware has it. Some readers begin with black, so
-    // the first color is black.
+    // On the hardware, rows start with color 0. Some readers start with black, so color 0 is black.
     palette_ = {};
     std::ranges::copy_n(PaletteOf(points).begin(), 3 * points.count, palette_.begin() + 3);
     nearest_ = std::make_unique<NearestColor>();
@@ -128,7 +127,7 @@ void WriteHead(ByteWriter& out, const PictureRecord& picture, const IffLayout& l
   if (layout.ham) WriteChunk(out, "CAMG", mode);
 }
 
-// The rows of a picture as they are stored, not yet compressed.
+// The rows of a picture in file layout, before compression.
 class StoredRows {
  public:
   StoredRows(const PictureRecord& picture, const IffLayout& layout, HamEncoder* ham)
@@ -164,8 +163,8 @@ class StoredRows {
     }
     if (layout_.packed) {
       std::ranges::copy(pixels, row_.begin());
-      // Padding that repeats the last pixel packs into its run. As a run of its own, some readers
-      // would take it for the next row.
+      // Padding repeats the last pixel to extend its run. Some readers would take a separate run
+      // for part of the next row.
       row_.back() = pixels.back();
     } else {
       SplitIffPlanes(pixels, PlaneSize(), layout_.planes, row_.data());
@@ -197,7 +196,7 @@ Status WriteBody(ByteWriter& out, const PictureRecord& picture, const IffLayout&
     }
     RETURN_IF_BAD(picture.ReportRow(y));
   }
-  if (out.Failed()) return Status::Ok;  // told by the commit
+  if (out.Failed()) return Status::Ok;  // reported by the commit
   const uint64_t size = out.Position() - place - 4;
   out.Zeros(size % 2);
   out.PatchBe32(place, static_cast<uint32_t>(size));

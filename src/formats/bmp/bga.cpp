@@ -2,32 +2,31 @@
 //
 //   offset size  field
 //        0    2  "BA"
-//        2    4  bytes of the structure
-//        6    4  offset of the next such header from the start of the file, 0 in the last one
+//        2    4  size of this structure
+//        6    4  file offset of the next array header, 0 in the last one
 //       10    4  width and height of the device, 0 for any
 //       14       a file header:
 //       +0    2  "BM" bitmap, "IC" icon, "PT" pointer, "CI" color icon, "CP" color pointer
-//       +2    4  bytes of the structure
-//       +6    4  hot spot x, and y counted from the bottom
-//      +10    4  offset of the pixels from the start of the file
+//       +2    4  size of this structure
+//       +6    4  hot spot x, and y from the bottom
+//      +10    4  file offset of the pixels
 //      +14       an information header, then the palette:
 //
 //   12 bytes: its size 4, width 2, height 2, planes 2, bits 2; palette entries of 3 bytes
-//   16 and more: its size 4, width 4, height 4, planes 2, bits 2, and as far as the size goes
-//      compression 4, bytes of the pixels 4, resolutions 8, colors used 4, important 4; palette
+//   16 and more: its size 4, width 4, height 4, planes 2, bits 2, and depending on its size
+//      compression 4, size of the pixels 4, resolutions 8, colors used 4, important 4; palette
 //      entries of 4 bytes
 //
-// Colors are blue, green, red (and 0); rows run from the bottom up, each padded to 4 bytes. Icons
-// and pointers have 1 bit and twice the height: the upper half is the AND mask (set: transparent),
-// the lower one the XOR mask. Behind the palette of color icons and pointers comes a second file
-// header with the picture itself; the first one holds the masks.
+// Colors are blue, green, red (and 0); rows are stored bottom-up, each padded to 4 bytes. Icons and
+// pointers have 1 bit and twice the height: the upper half is the AND mask (set: transparent), the
+// lower half the XOR mask. For color icons and pointers, the palette is followed by a second file
+// header for the picture itself; the first one is for the masks.
 //
-// The reader also takes files of one entry without the array. It stops at an array header that
-// does not lie behind the one before. Masked pixels become transparent, inverting ones as well; a
-// fourth byte of pixels that is 0 everywhere is no alpha. The writer stores one bitmap, with the
-// header of 12 bytes where that can hold it, with the one of 40 otherwise: pictures with alpha as
-// 32 bits, and sides above 65535. Source: IBM, "OS/2 Presentation Manager Programming Reference",
-// bitmap file format.
+// The reader also accepts files with a single entry and no array. It stops at an array header whose
+// offset is not after the previous one. Masked pixels become transparent, even inverting ones; a
+// fourth byte that is 0 in all pixels is not alpha. The writer stores one bitmap, with a 12-byte
+// header if possible, otherwise with 40 bytes: for pictures with alpha, as 32 bits, and for sides
+// above 65535. Source: IBM, "OS/2 Presentation Manager Programming Reference", bitmap file format.
 #include "formats/bmp/bga.h"
 
 #include <algorithm>
@@ -66,7 +65,7 @@ constexpr KindName kKinds[] = {
 };
 // clang-format on
 
-// One bitmap of the file: its headers.
+// Headers of one bitmap in the file.
 struct Bitmap {
   const KindName* kind = nullptr;
   uint16_t hotSpotX = 0, hotSpotY = 0;
@@ -84,7 +83,7 @@ struct Bitmap {
     const uint64_t all = bits > 8 ? 0 : uint64_t{1} << bits;
     return colorsUsed == 0 || colorsUsed > all ? all : colorsUsed;
   }
-  // Stored row r, which the file holds.
+  // Row r in stored order, which must be within the file.
   std::span<const uint8_t> Row(std::span<const uint8_t> file, int32_t r) const {
     const int32_t stored = topDown ? height - 1 - r : r;
     return file.subspan(pixelOffset + static_cast<uint64_t>(stored) * Stride(), Stride());
@@ -94,8 +93,8 @@ struct Bitmap {
 // One entry: its picture, and the masks of icons and pointers.
 struct Entry {
   Bitmap color, masks;
-  bool masked = false;       // `masks` counts
-  bool transparent = false;  // a pixel is masked
+  bool masked = false;       // `masks` is used
+  bool transparent = false;  // at least one pixel is masked
 };
 
 const KindName* FindKind(std::span<const uint8_t> signature) {
@@ -128,7 +127,7 @@ void ParseInfo(ByteReader& bytes, Bitmap& bitmap) {
   bytes.Seek(end);
 }
 
-// Reads the headers at an offset. DamagedFile, FileReadError, UnsupportedFormat.
+// Parses the headers at an offset. DamagedFile, FileReadError, UnsupportedFormat.
 Status ParseBitmap(std::span<const uint8_t> file, uint64_t offset, Bitmap& bitmap) {
   ByteReader bytes(file);
   bytes.Seek(offset);
@@ -157,7 +156,7 @@ Status ParseBitmap(std::span<const uint8_t> file, uint64_t offset, Bitmap& bitma
   return decoded ? Status::Ok : Status::UnsupportedFormat;
 }
 
-// FileReadError when the file has no room for the rows of a bitmap without compression.
+// FileReadError if the rows of an uncompressed bitmap do not fit into the file.
 Status CheckRowsFit(std::span<const uint8_t> file, const Bitmap& bitmap) {
   if (bitmap.pixelOffset > file.size()) return Status::FileReadError;
   if (bitmap.compression != kPlain) return Status::Ok;
@@ -183,7 +182,7 @@ bool AnyMasked(std::span<const uint8_t> file, const Entry& entry) {
   return false;
 }
 
-// Reads an entry's headers and finds out whether a mask hides anything.
+// Parses an entry's headers, and checks whether a mask hides any pixel.
 Status ParseEntry(std::span<const uint8_t> file, uint64_t offset, Entry& entry) {
   RETURN_IF_BAD(ParseBitmap(file, offset, entry.color));
   RETURN_IF_BAD(CheckRowsFit(file, entry.color));
@@ -207,7 +206,7 @@ Status ParseEntry(std::span<const uint8_t> file, uint64_t offset, Entry& entry) 
   return Status::Ok;
 }
 
-// Where the entries' file headers are, in the order of the file.
+// File offsets of the entries' file headers, in file order.
 Status FindEntries(std::span<const uint8_t> file, std::vector<uint64_t>& entries) {
   if (file.size() < 2) return Status::FileReadError;
   if (FindKind(file.first(2)) != nullptr) {
@@ -263,7 +262,7 @@ Status DescribeEntry(std::span<const uint8_t> file, const ReadRequest& request,
   return CheckPackedSize(picture.width, picture.height, picture.bitsPerPixel);
 }
 
-// A row of the picture from one of the file.
+// Converts a row of the file to the picture.
 void SpreadColors16(std::span<const uint8_t> source, size_t width, uint8_t* row) {
   const auto widen = [](uint32_t value) { return static_cast<uint8_t>(value << 3 | value >> 2); };
   for (size_t x = 0; x < width; ++x) {
@@ -281,8 +280,8 @@ void SpreadIndices(std::span<const uint8_t> source, const Bitmap& bitmap, const 
   }
 }
 
-// Fills the rows of `image`, and of `alpha` when pixels carry it or a mask hides some. `stored`
-// gives a row of the file's depth.
+// Fills the rows of `image`, and of `alpha` if pixels have alpha or a mask hides some. `stored`
+// returns rows at the file's depth.
 template <typename StoredRows>
 Status PutRows(std::span<const uint8_t> file, const Entry& entry, const PictureRecord& picture,
                StoredRows stored, PackedImage& image, PackedImage& alpha) {
@@ -329,7 +328,7 @@ bool IsAllZero(std::span<const uint8_t> bytes) {
   return std::ranges::all_of(bytes, [](uint8_t byte) { return byte == 0; });
 }
 
-// What the writer stores for a picture.
+// File layout for a picture to write.
 struct BgaLayout {
   bool alpha = false, core = true;
   uint32_t bits = 24, colors = 0, infoSize = kCoreSize, pixelOffset = 0;

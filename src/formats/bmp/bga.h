@@ -6,10 +6,10 @@
 
 namespace fotomill {
 
-// OS/2 bitmap arrays; also single bitmaps, icons and pointers of OS/2. `page` of the request counts
-// the entries in the order of the file. Statuses: FileOpenError (1), DamagedFile (2), FileReadError
-// (3) when data are cut short, MemoryAllocationError (6), UnsupportedFormat (8) for depths and
-// compressions that are not read, NoImages (20) for a page that is not there.
+// OS/2 bitmap arrays; also single bitmaps, icons and pointers of OS/2. `page` of the request is an
+// index of entries in file order. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3)
+// if truncated, MemoryAllocationError (6), UnsupportedFormat (8) for unsupported depths and
+// compressions, NoImages (20) if the page does not exist.
 Status BgaInfo(PictureRecord& picture, const ReadRequest& request);
 Status BgaRead(PictureRecord& picture, const ReadRequest& request);
 // Writes an array of one bitmap. Also ErrorCreatingFile (10), ErrorWritingFile (11).

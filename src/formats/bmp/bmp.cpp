@@ -2,41 +2,39 @@
 //
 //   offset size  field
 //        0    2  "BM"
-//        2    4  bytes of the file
-//        6    4  reserved, written 0
-//       10    4  offset of the first pixel byte
-//       14    4  header size: 12 for OS/2, written 40 for Windows, where any other value is taken
+//        2    4  file size
+//        6    4  reserved, written as 0
+//       10    4  file offset of the pixels
+//       14    4  header size: 12 for OS/2; any other value is read as Windows, written as 40
 //
 //   Windows      field                                   OS/2         field
 //       18    4  width                                       18    2  width
 //       22    4  height; negative: top row first             20    2  height
-//       26    2  planes, written 1                           22    2  planes, written 1
+//       26    2  planes, written as 1                        22    2  planes, written as 1
 //       28    2  bits per pixel                              24    2  bits per pixel
-//       30    4  compression, written 0                      26       3-byte palette, then the rows
-//       34    4  bytes of all rows
-//       38    8  two resolutions, written 0
+//       30    4  compression, written as 0                   26       3-byte palette, then the rows
+//       34    4  size of all rows
+//       38    8  two resolutions, written as 0
 //       46    8  colors used and important
 //       54       4-byte palette
 //
-// Palette entries are blue, green, red (and 0). Rows run from the bottom up, each padded to 4
-// bytes; pixels are indices of 1, 4 or 8 bits, or blue, green, red (and alpha).
+// Palette entries are blue, green, red (and 0). Rows are stored bottom-up, each padded to 4 bytes;
+// pixels are indices of 1, 4 or 8 bits, or blue, green, red (and alpha).
 //
-// The reader takes compressions 1 (RLE8) and 2 (RLE4); everything else counts as uncompressed. Its
-// peculiarities:
-// - Both dialects need 54 bytes of header. The palette always has 2^bits entries and follows the
-// 40-byte header, whatever
-//   header size and colors used say; OS/2 pixels follow the palette, whatever the pixel offset
-//   says.
-// - 16 bits with compression 3: the three masks after the header do not count in the pixel offset,
-// so pixels start 12
-//   bytes after it. Masks of 5-6-5 give blue, green, red; all other 16-bit files are 5-5-5 and give
-//   red, green, blue.
+// The reader supports compressions 1 (RLE8) and 2 (RLE4); all others are treated as uncompressed.
+// Its quirks:
+// - Both dialects need 54 header bytes. The palette always has 2^bits entries and follows the
+//   40-byte header, regardless of header size and colors used; OS/2 pixels follow the palette,
+//   regardless of the pixel offset.
+// - 16 bits with compression 3: the pixel offset does not include the three masks after the header,
+//   so pixels start 12 bytes after it. 5-6-5 masks give blue, green, red; all other 16-bit files
+//   are 5-5-5 and give red, green, blue.
 // - A 16-bit file may end within its last row.
-// - Depths without a conversion of their own (2, 12, 64) are copied byte for byte as far as they
-// fit a row.
-// - Run-length data must end with an end-of-bitmap code; pixels outside the picture are dropped.
+// - Depths without a specific conversion (2, 12, 64) are copied byte for byte as far as they fit a
+//   row.
+// - Run-length data must end with an end-of-bitmap code; pixels outside the picture are ignored.
 //
-// The writer stores uncompressed rows, 32-bit ones when there is an alpha plane; OS/2 files have no
+// The writer stores uncompressed rows, 32-bit ones if there is an alpha plane; OS/2 files have no
 // alpha. Source: Microsoft, "BITMAPINFOHEADER structure" and "Bitmap Compression", Windows GDI
 // reference; IBM, OS/2 2.0 "Presentation Manager Programming Reference", bitmap file format.
 #include "formats/bmp/bmp.h"
@@ -58,42 +56,42 @@ namespace fotomill {
 
 namespace {
 
-// both headers of the Windows dialect; OS/2 files need as many bytes
+// both headers of the Windows dialect; also required for OS/2 files
 constexpr uint64_t kHeaderSize = 54;
 constexpr uint64_t kOs2HeaderSize = 26;
 constexpr uint32_t kOs2InfoSize = 12;
 constexpr uint32_t kWindowsInfoSize = 40;
 constexpr uint64_t kMasksSize = 12;
-// rows are read and written in pieces of about this many bytes
+// rows are read and written in chunks of about this size
 constexpr uint64_t kChunkSize = 16 << 20;
 
 constexpr uint32_t kRle8 = 1, kRle4 = 2, kBitFields = 3;
 
 struct BmpHeader {
-  uint32_t fileSize = 0;  // as the file claims
+  uint32_t fileSize = 0;  // as stored, unchecked
   uint32_t pixelOffset = 0;
   uint32_t infoSize = 0;  // size of the second header
   int32_t width = 0;
   int32_t height = 0;  // negative: top row first
   uint16_t planes = 0;
-  uint16_t bits = 0;  // of the file, any value
+  uint16_t bits = 0;  // as stored, any value
   uint32_t compression = 0;
   uint32_t imageBytes = 0;
-  uint32_t resolutionX = 0, resolutionY = 0;  // pixels per metre
+  uint32_t resolutionX = 0, resolutionY = 0;  // pixels per meter
   uint32_t colorsUsed = 0, colorsImportant = 0;
 
   bool IsOs2() const { return infoSize == kOs2InfoSize; }
-  // Whether other programs may find other colors in it: the writer's forms leave no doubt.
+  // Whether other programs may read it differently; never the case for files of our writer.
   bool IsPeculiar() const {
     return (!IsOs2() && infoSize != kWindowsInfoSize) || bits == 16 ||
            (bits > 8 && compression != 0);
   }
   bool TopDown() const { return height < 0; }
-  // The number of rows, 0 when it is more than a height can say.
+  // Number of rows, 0 if it is out of range.
   int32_t Rows() const {
     return height == std::numeric_limits<int32_t>::min() ? 0 : std::abs(height);
   }
-  // The depth of the picture: what the file says up to 8, else 24.
+  // Depth of the picture: as stored up to 8, else 24.
   int32_t Depth() const { return bits > 8 ? 24 : bits; }
   uint64_t FileStride() const { return RowStride(width, bits); }
   uint64_t PaletteOffset() const { return IsOs2() ? kOs2HeaderSize : kHeaderSize; }
@@ -105,7 +103,7 @@ struct BmpHeader {
   }
 };
 
-// Ok, or DamagedFile without the signature or a whole header.
+// Ok, or DamagedFile if the signature is wrong or the header is truncated.
 Status ParseHeader(std::span<const uint8_t> file, BmpHeader& header) {
   ByteReader bytes(file.first(std::min<size_t>(file.size(), kHeaderSize)));
   const bool signature = bytes.Match("BM");
@@ -134,8 +132,8 @@ Status ParseHeader(std::span<const uint8_t> file, BmpHeader& header) {
   return signature && bytes.Ok() ? Status::Ok : Status::DamagedFile;
 }
 
-// Fills `palette` for the header's depth from the head of the file. Entries that the file does not
-// hold stay as they are in the black and white palette.
+// Reads `palette` for the header's depth. Entries missing in the file keep their value in the black
+// and white palette.
 void ReadPalette(std::span<const uint8_t> file, const BmpHeader& header, Palette& palette) {
   MakeDefaultPalette(&palette, nullptr, header.bits > 8 ? kDisplayPalette : kBlackAndWhitePalette);
   const uint64_t begin = std::min<uint64_t>(header.PaletteOffset(), file.size());
@@ -149,8 +147,7 @@ void ReadPalette(std::span<const uint8_t> file, const BmpHeader& header, Palette
   }
 }
 
-// Fills the record's facts from the head of the file. DamagedFile when the header leaves nothing to
-// decode.
+// Fills in the record's header fields. DamagedFile if nothing can be decoded.
 Status DescribePicture(const platform::FileView& file, const BmpHeader& header,
                        PictureRecord& picture) {
   if (header.width < 1 || header.Rows() < 1 || header.bits < 1) return Status::DamagedFile;
@@ -166,9 +163,9 @@ Status DescribePicture(const platform::FileView& file, const BmpHeader& header,
   return Status::Ok;
 }
 
-// What one row becomes. `source` is a row of the file, which may be short only where the reader
-// allows it; `row` a row of the picture and `alpha` one of its alpha plane (empty without one),
-// padding included. Writes all of `row`.
+// Converts one row. `source` is a row of the file, which may be truncated only if the reader allows
+// it; `row` is a row of the picture and `alpha` one of its alpha plane (empty if there is none),
+// padding included. Must write all of `row`.
 using RowReader = void (*)(std::span<const uint8_t> source, int32_t width, std::span<uint8_t> row,
                            std::span<uint8_t> alpha);
 
@@ -178,7 +175,7 @@ void CopyRow(std::span<const uint8_t> source, int32_t, std::span<uint8_t> row, s
   std::memset(row.data() + count, 0, row.size() - count);
 }
 
-// Calls `spread(pixel, place)` for each whole 16-bit pixel of a row.
+// Calls `spread(pixel, place)` for each complete 16-bit pixel of a row.
 template <typename Spread>
 void ReadRow16(std::span<const uint8_t> source, int32_t width, std::span<uint8_t> row,
                Spread spread) {
@@ -198,8 +195,8 @@ void ReadRow565(std::span<const uint8_t> source, int32_t width, std::span<uint8_
   });
 }
 
-// Red comes first here, other than in all other rows: files read so since the format's first
-// support, and stay so.
+// Red first, unlike in all other rows: a quirk of the format's first support,
+// kept for compatibility.
 void ReadRow555(std::span<const uint8_t> source, int32_t width, std::span<uint8_t> row,
                 std::span<uint8_t>) {
   ReadRow16(source, width, row, [](uint32_t pixel, uint8_t* place) {
@@ -223,8 +220,7 @@ void ReadRow32Alpha(std::span<const uint8_t> source, int32_t width, std::span<ui
   std::memset(row.data() + 3 * count, 0, row.size() - 3 * count);
 }
 
-// Whether the masks after the header are those of 5-6-5 pixels. FileReadError when the file ends
-// within them.
+// Whether the masks after the header are for 5-6-5 pixels. FileReadError if they are truncated.
 Status ReadMasks(std::span<const uint8_t> file, bool& is565) {
   ByteReader bytes(file);
   bytes.Seek(kHeaderSize);
@@ -246,7 +242,8 @@ Status ChooseRowReader(const platform::FileView& file, const BmpHeader& header,
   return Status::Ok;
 }
 
-// FileReadError when the file has no room for its rows. The last row of 16-bit pixels may be short.
+// FileReadError if the rows do not fit into the file. The last row of 16-bit pixels
+// may be truncated.
 Status CheckRowsFit(const platform::FileView& file, const BmpHeader& header) {
   const uint64_t rows = static_cast<uint64_t>(header.Rows()) - (header.bits == 16 ? 1 : 0);
   uint64_t size = 0, end = 0;
@@ -255,7 +252,7 @@ Status CheckRowsFit(const platform::FileView& file, const BmpHeader& header) {
   return counted && end <= file.FileSize() ? Status::Ok : Status::FileReadError;
 }
 
-// How many rows the file holds in full, at most all of them.
+// Number of complete rows in the file, at most all.
 int32_t RowsInFile(const platform::FileView& file, const BmpHeader& header) {
   const uint64_t bytes = file.FileSize() - header.PixelOffset();
   const uint64_t stride = std::max<uint64_t>(header.FileStride(), 1);
@@ -267,7 +264,7 @@ int32_t RowsPerChunk(uint64_t stride) {
   return static_cast<int32_t>(std::max<uint64_t>(kChunkSize / stride, 1));
 }
 
-// The first `rows` rows, stored as in memory, are copied directly.
+// Copies the first `rows` rows, whose layout is the same in memory.
 Status ReadRowsUnchanged(const platform::FileView& file, const BmpHeader& header, int32_t rows,
                          const PictureRecord& picture, PackedImage& image) {
   const int32_t height = image.Height();
@@ -303,7 +300,7 @@ Status ReadRowsConverted(platform::FileView& file, const BmpHeader& header, int3
   return file.Intact() ? Status::Ok : Status::FileReadError;
 }
 
-// What the writer stores for a picture.
+// File layout for a picture to write.
 struct BmpLayout {
   bool os2 = false;
   bool alpha = false;
@@ -315,7 +312,7 @@ struct BmpLayout {
   uint32_t fileSize = 0;
 };
 
-// UnsuitableImage when a size does not fit its field.
+// UnsuitableImage if a size does not fit its field.
 Status ChooseLayout(const PictureRecord& picture, bool os2, BmpLayout& layout) {
   const PackedImage& image = picture.image;
   layout.os2 = os2;
@@ -400,7 +397,7 @@ Status WriteRowsWithAlpha(ByteWriter& out, const PictureRecord& picture) {
   return Status::Ok;
 }
 
-// A number of a header with a comma between every group of three digits.
+// A header value with commas as thousands separators.
 std::string Number(int64_t number) {
   std::string text(number < 0 ? "-" : "");
   text += WithThousands(static_cast<uint64_t>(std::abs(number)));

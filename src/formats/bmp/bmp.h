@@ -6,28 +6,28 @@
 
 namespace fotomill {
 
-// The BMP family: Windows and OS/2 bitmaps. The file layout, and what is peculiar to this
-// codec, is described in bmp.cpp.
+// The BMP family: Windows and OS/2 bitmaps. For the file layout and this codec's
+// quirks see bmp.cpp.
 
-// Fills the facts of `picture`: size, depth, palette, type name, kHasAlpha for files deeper than 24
-// bits. Ok, FileOpenError; DamagedFile for a short header, another signature, or a size or depth
-// that leaves nothing to decode.
+// Sets size, depth, palette and type name, and kHasAlpha for files deeper than 24 bits. Ok,
+// FileOpenError; DamagedFile for a truncated header, a wrong signature, or a size or depth that
+// cannot be decoded.
 Status BmpInfo(PictureRecord& picture, const ReadRequest& request);
 
-// Fills the facts and decodes the pixels into `image`, and with `UseAlphaChannels` the fourth
-// channel into `alpha`. Ok, FileOpenError, DamagedFile as BmpInfo; FileReadError when the file ends
-// too early; MemoryAllocationError.
+// Calls BmpInfo and decodes the pixels into `image`, and with
+// `UseAlphaChannels` the fourth channel into `alpha`. Statuses of
+// BmpInfo, and FileReadError if truncated, MemoryAllocationError.
 Status BmpRead(PictureRecord& picture, const ReadRequest& request);
 
-// Writes `image`, and `alpha` as the fourth channel, to picture.fileName, uncompressed, in the
-// dialect that `WriteOS2Bitmaps` says. Ok; MemoryAllocationError when there is no image;
-// UnsuitableImage when a size does not fit the header's fields; ErrorCreatingFile,
-// ErrorWritingFile.
+// Writes `image`, and `alpha` as the fourth channel, to picture.fileName,
+// uncompressed, in the dialect selected by `WriteOS2Bitmaps`. Ok;
+// MemoryAllocationError if there is no image; UnsuitableImage if a size
+// does not fit the header's fields; ErrorCreatingFile, ErrorWritingFile.
 Status BmpWrite(PictureRecord& picture, const WriteOptions& options);
 
-// Fills `detailLines` with the header of picture.fileName, and sets `fileSize` and a black and
-// white palette as BmpInfo begins with. Ok, FileOpenError, DamagedFile for a short header or
-// another signature.
+// Fills `detailLines` from the header of picture.fileName, and sets `fileSize` and a black
+// and white palette like BmpInfo. Ok, FileOpenError, DamagedFile for a truncated header or
+// a wrong signature.
 Status BmpDetails(PictureRecord& picture);
 
 }  // namespace fotomill

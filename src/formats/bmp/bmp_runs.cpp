@@ -11,8 +11,8 @@ namespace {
 
 constexpr uint8_t kEndOfLine = 0, kEndOfBitmap = 1, kMove = 2;
 constexpr size_t kMostInToken = 255;
-constexpr size_t kFewestPlain = 3;  // smaller counts behind a 0 mean something else
-constexpr size_t kShortestRun = 4;  // shorter ones cost more than they save between plain pixels
+constexpr size_t kFewestPlain = 3;  // smaller counts after a 0 are escapes
+constexpr size_t kShortestRun = 4;  // shorter runs between literals do not save space
 
 struct Rle8 {
   static constexpr uint64_t kPixelsPerByte = 1;
@@ -47,7 +47,7 @@ Status Decode(platform::FileView& file, const BmpRuns& runs, const PictureRecord
   ByteReader bytes(file.Bytes());
   bytes.Seek(runs.offset);
   uint64_t x = 0, y = 0;
-  // How many of `count` pixels at (x, y) are in the picture, and where the row begins.
+  // Number of the `count` pixels at (x, y) inside the picture, and the start of the row.
   const auto inside = [&](uint64_t count) {
     return y < height && x < limit ? std::min(count, limit - x) : 0;
   };
@@ -110,7 +110,7 @@ Status DecodeBmpRuns(platform::FileView& file, const BmpRuns& runs, const Pictur
 }
 
 void EncodeRle8Row(std::span<const uint8_t> row, ByteWriter& out) {
-  size_t plain = 0;  // where the pixels that no run has taken begin
+  size_t plain = 0;  // start of the pending literal pixels
   for (size_t x = 0; x < row.size();) {
     const size_t end = std::min(row.size(), x + kMostInToken);
     size_t next = x + 1;

@@ -1,10 +1,8 @@
-// Windows bitmaps compressed by runs (RLE), little-endian: the file and information headers and
-// the palette of bmp.cpp with 8 bits and compression 1, then the codes of bmp_runs.h, the bottom
-// line first.
+// Windows bitmaps with run-length encoding (RLE), little-endian: the headers and palette of bmp.cpp
+// with 8 bits and compression 1, then the codes of bmp_runs.h, bottom line first.
 //
-// Such files may hold any bitmap, so they are read like BMP. The writer stores 256 colors whatever
-// the picture's depth. Source: Microsoft, "Bitmap Storage" and "Bitmap Compression", Windows GDI
-// reference.
+// Such files may contain any bitmap, so they are read as BMP. The writer always stores 256 colors.
+// Source: Microsoft, "Bitmap Storage" and "Bitmap Compression", Windows GDI reference.
 #include "formats/bmp/rle.h"
 
 #include "core/byte_writer.h"
@@ -21,7 +19,7 @@ constexpr uint64_t kFileSizeOffset = 2, kImageSizeOffset = 34;
 
 void WriteHead(ByteWriter& out, const PackedImage& image, const Palette& palette) {
   out.Text("BM");
-  out.Le32(0);  // the file's size, known at the end
+  out.Le32(0);  // file size, patched at the end
   out.Le32(0);
   out.Le32(kPixelOffset);
   out.Le32(40);
@@ -30,7 +28,7 @@ void WriteHead(ByteWriter& out, const PackedImage& image, const Palette& palette
   out.Le16(1);
   out.Le16(8);
   out.Le32(1);  // RLE8
-  out.Le32(0);  // the codes' size, known at the end
+  out.Le32(0);  // data size, patched at the end
   out.Zeros(16);
   for (size_t i = 0; i < 3 * size_t{kColors}; i += 3) {
     for (const uint8_t value : {palette[i + 2], palette[i + 1], palette[i], uint8_t{0}})

@@ -5,9 +5,9 @@
 
 namespace fotomill {
 
-// Writes a Windows bitmap of 256 colors, compressed by runs (RLE8); BmpInfo and BmpRead read it.
-// Ok; MemoryAllocationError, TooManyColors (12) above 8 bits, ErrorCreatingFile, ErrorWritingFile,
-// FunctionCancelled.
+// Writes a 256-color Windows bitmap with run-length encoding (RLE8), to be read by BmpInfo and
+// BmpRead. Ok; MemoryAllocationError, TooManyColors (12) above 8 bits, ErrorCreatingFile,
+// ErrorWritingFile, FunctionCancelled.
 Status RleWrite(PictureRecord& picture, const WriteOptions& options);
 
 }  // namespace fotomill

@@ -1,16 +1,18 @@
-// CALS raster (CAL, CALS): scanned drawings in black and white.
+// CALS raster (CAL, CALS): bilevel scanned drawings.
 //
-//   2048 bytes of text: records of 128 bytes, padded with blanks, each a name, a colon and a value
-//     srcdocid, dstdocid, txtfilid, figid, srcgph, doccls   identification, written "NONE"
+//   2048 bytes of text: blank-padded records of 128 bytes, each a name, a colon and a value
+//     srcdocid, dstdocid, txtfilid, figid, srcgph, doccls   identification, written as "NONE"
 //     rtype      1: one picture; 2: tiles
-//     rorient    degrees: the direction of pixels in a row, counterclockwise from the right, and
-//     that of rows from there rpelcnt    pixels in a row, and rows rdensty    pixels per inch notes
-//     written "NONE"
-//   then the rows, coded as group 4 fax machines do; a set bit is black
+//     rorient    degrees: direction of the pixels in a row, counterclockwise from the right, and
+//                direction of the rows relative to it
+//     rpelcnt    pixels per row, and rows
+//     rdensty    pixels per inch
+//     notes      written as "NONE"
+//   then the rows in fax group 4 coding; a set bit is black
 //
-// The reader takes records in any order and turns the picture upright. The writer stores the darker
-// of two colors as black. Source: MIL-STD-1840 and MIL-PRF-28002C, "Raster Graphics Representation
-// in Binary Format" (1997); ITU-T T.6 (1988).
+// The reader accepts records in any order and rotates the picture upright. The writer stores the
+// darker of two colors as black. Source: MIL-STD-1840 and MIL-PRF-28002C, "Raster Graphics
+// Representation in Binary Format" (1997); ITU-T T.6 (1988).
 #include "formats/cals/cals.h"
 
 #include <algorithm>
@@ -32,7 +34,7 @@ namespace {
 
 constexpr size_t kHeaderSize = 2048, kRecordSize = 128;
 
-// The directions of pixels and rows, and how a picture stored so becomes upright.
+// Directions of pixels and rows, and the orientation that makes the picture upright.
 struct Direction {
   int32_t pixels, rows;
   Orientation orientation;
@@ -52,7 +54,7 @@ struct CalsHeader {
   size_t RowSize() const { return (static_cast<size_t>(width) + 7) / 8; }
 };
 
-// Up to two numbers separated by a comma; those that are missing stay.
+// Parses up to two numbers separated by a comma; missing ones are unchanged.
 void ReadNumbers(std::string_view text, int32_t& first, int32_t& second) {
   for (int32_t* number : {&first, &second}) {
     while (!text.empty() && (text.front() == ' ' || text.front() == ',')) text.remove_prefix(1);
@@ -62,7 +64,7 @@ void ReadNumbers(std::string_view text, int32_t& first, int32_t& second) {
   }
 }
 
-// Ok; FileReadError for a short header, DamagedFile where a record that counts is missing,
+// Ok; FileReadError for a truncated header, DamagedFile if a required record is missing,
 // UnsupportedFormat for tiles.
 Status ParseHeader(std::span<const uint8_t> file, CalsHeader& header) {
   const std::string_view text(reinterpret_cast<const char*>(file.data()),
@@ -105,7 +107,7 @@ Status DescribePicture(const platform::FileView& file, const ReadRequest&, CalsH
 Status Decode(platform::FileView& file, const CalsHeader& header, const PictureRecord& picture,
               PackedImage& image) {
   const auto data = file.Bytes().subspan(kHeaderSize);
-  // a row is one bit at least
+  // every row takes at least one bit
   if (static_cast<uint64_t>(header.height) > 8 * data.size()) return Status::FileReadError;
   PackedImage stored;
   RETURN_IF_BAD(NewPackedImage(header.width, header.height, &picture.palette, 1, stored));

@@ -6,8 +6,8 @@
 
 namespace fotomill {
 
-// CALS rasters of type 1. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when data
-// are cut short, MemoryAllocationError (6), UnsupportedFormat (8) for tiled files.
+// CALS rasters of type 1. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) if
+// truncated, MemoryAllocationError (6), UnsupportedFormat (8) for tiled files.
 Status CalsInfo(PictureRecord& picture, const ReadRequest& request);
 Status CalsRead(PictureRecord& picture, const ReadRequest& request);
 // Also TooManyColors (12) for pictures deeper than 1 bit, ErrorCreatingFile (10), ErrorWritingFile

@@ -4,14 +4,14 @@
 
 namespace fotomill {
 
-// The code words of two-dimensional fax coding. Each text is a word bit by bit, as the
-// recommendation prints it. Source: ITU-T T.4 (2003), tables 2, 3a and 3b for runs; ITU-T T.6
-// (1988), table 1 for modes.
+// Code words of two-dimensional fax coding, as strings of bits
+// like in the recommendation. Source: ITU-T T.4 (2003), tables
+// 2, 3a and 3b for runs; ITU-T T.6 (1988), table 1 for modes.
 
-// Words for runs of 0 to 63 pixels, then 64, 128, ... 1728 pixels. A longer run is made of these.
+// Codes for runs of 0 to 63 pixels, then 64, 128, ... 1728 pixels. Longer runs combine these.
 inline constexpr int32_t kTerminatingCodes = 64, kMakeUpCodes = 27;
 
-// Words of white runs, as bits: first by terminating length, then by make-up length.
+// White run codes: terminating codes, then make-up codes.
 inline constexpr const char* kWhiteRunWords[kTerminatingCodes + kMakeUpCodes] = {
     "00110101",  "000111",    "0111",      "1000",      "1011",      "1100",      "1110",      "1111",
     "10011",     "10100",     "00111",     "01000",     "001000",    "000011",    "110100",    "110101",
@@ -26,7 +26,7 @@ inline constexpr const char* kWhiteRunWords[kTerminatingCodes + kMakeUpCodes] = 
     "011010110", "011010111", "011011000", "011011001", "011011010", "011011011", "010011000", "010011001",
     "010011010", "011000",    "010011011"};
 
-// Words of black runs in the same order.
+// Black run codes in the same order.
 inline constexpr const char* kBlackRunWords[kTerminatingCodes + kMakeUpCodes] = {
     "0000110111",    "010",           "11",            "10",            "011",           "0011",
     "0010",          "00011",         "000101",        "000100",        "0000100",       "0000101",
@@ -45,15 +45,15 @@ inline constexpr const char* kBlackRunWords[kTerminatingCodes + kMakeUpCodes] = 
     "0000001010011", "0000001010100", "0000001010101", "0000001011010", "0000001011011", "0000001100100",
     "0000001100101"};
 
-// Runs of 1792, 1856, ... 2560 pixels of either color.
+// Runs of 1792, 1856, ... 2560 pixels, with the same codes for both colors.
 inline constexpr int32_t kFirstLongRun = 1792, kLongestRun = 2560;
-// Make-up words that both colors share, from 1792 on.
+// Their make-up codes, from 1792 on.
 inline constexpr const char* kLongRunWords[] = {
     "00000001000",  "00000001100",  "00000001101",  "000000010010", "000000010011", "000000010100", "000000010101",
     "000000010110", "000000010111", "000000011100", "000000011101", "000000011110", "000000011111"};
 
-// What a mode word says of the next changing pixel a1. Vertical(d): d pixels right of b1, the
-// change in the row above.
+// Meaning of a mode code for the next changing pixel a1. Vertical(d): d pixels to the right of b1,
+// the change in the row above.
 enum class FaxMode : uint8_t {
   VerticalLeft3,
   VerticalLeft2,
@@ -65,7 +65,7 @@ enum class FaxMode : uint8_t {
   Pass,
   Horizontal
 };
-// Words of the two-dimensional modes.
+// Codes of the two-dimensional modes.
 inline constexpr const char* kModeWords[] = {"0000010", "000010",  "010",  "1",  "011",
                                              "000011",  "0000011", "0001", "001"};
 

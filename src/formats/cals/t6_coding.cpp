@@ -11,10 +11,10 @@ namespace fotomill {
 
 namespace {
 
-// What the next bits of a code stream mean, looked up by kLongestWord of them.
+// Lookup table entry for the next kLongestWord bits.
 struct Word {
-  int16_t value = -1;   // a run length or a mode; -1: no word begins so
-  uint8_t bits = 0;     // length of the word
+  int16_t value = -1;   // a run length or a mode; -1: not a valid code
+  uint8_t bits = 0;     // length of the code
 };
 using WordTable = std::array<Word, 1 << kLongestWord>;
 
@@ -56,14 +56,14 @@ const WordTable& ModeTable() {
   return table;
 }
 
-// The first change in the row above that is right of `a0` and turns to the color opposite to
-// `black`, the color at `a0`: changes with an even place turn to black. `place` begins where the
-// search for the change before ended. The row starts on an imaginary white pixel left of it, so
-// that a change at column 0 counts while a0 is -1.
+// Finds b1: the first change in the row above to the right of `a0` to the color opposite to
+// `black`, the color at `a0`; changes at even indices are to black. The search starts at `place`,
+// where the previous one ended. Rows start at an imaginary white pixel before column 0, so a change
+// at column 0 is found while a0 is -1.
 size_t FindB1(const std::vector<int32_t>& above, size_t place, int32_t a0, bool black) {
   place = place > 1 ? place - 2 : 0;
   if ((place % 2 != 0) != black) ++place;
-  while (above[place] <= a0) place += 2;  // ends at the closing widths, for a0 is before them
+  while (above[place] <= a0) place += 2;  // stops at the terminating widths, as a0 is below them
   return place;
 }
 
@@ -80,7 +80,7 @@ void FillBits(std::span<uint8_t> row, int32_t from, int32_t to) {
   if (tail != 0) row[last] |= tail;
 }
 
-// Adds a change to a list; two at the same column cancel each other.
+// Appends a change; two at the same column cancel out.
 void AddChange(std::vector<int32_t>& changes, int32_t column) {
   if (!changes.empty() && changes.back() == column) {
     changes.pop_back();
@@ -89,12 +89,12 @@ void AddChange(std::vector<int32_t>& changes, int32_t column) {
   }
 }
 
-// Ends a list of changes so that searches stop without asking where it ends.
+// Appends terminators, so that searches need no bounds check.
 void EndChanges(std::vector<int32_t>& changes, int32_t width) {
   changes.insert(changes.end(), 4, width);
 }
 
-// The next column from `x` on whose pixel is not of `black`'s color; `width` when there is none.
+// The next column from `x` on with a color other than `black`; `width` if there is none.
 int32_t NextChange(std::span<const uint8_t> row, int32_t x, int32_t width, bool black) {
   const uint8_t invert = black ? 0xff : 0;
   while (x < width) {
@@ -111,7 +111,7 @@ T6Decoder::T6Decoder(std::span<const uint8_t> data, int32_t width) : data_(data)
   EndChanges(above_, width_);
 }
 
-// The next kLongestWord bits; zeros behind the end.
+// The next kLongestWord bits, zero-padded at the end.
 uint32_t T6Decoder::PeekBits() {
   const uint64_t byte = bit_ / 8;
   uint32_t bits = 0;

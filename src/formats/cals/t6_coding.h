@@ -8,19 +8,19 @@
 
 namespace fotomill {
 
-// Two-dimensional coding of black and white rows, as fax machines of group 4 send them: each row
-// tells how the places where its color changes differ from those of the row above. Rows are packed,
-// the leftmost pixel in the highest bit, and 1 is black. Source: ITU-T T.6 (1988).
+// Two-dimensional coding of bilevel rows for group 4 fax: each row's color changes are coded
+// relative to those of the row above. Rows are packed, the leftmost pixel in the highest bit, and 1
+// is black. Source: ITU-T T.6 (1988).
 
-// Decodes row after row; the data stay with their owner.
+// Decodes row by row; does not own the data.
 class T6Decoder {
  public:
   // `width` is at least 1.
   T6Decoder(std::span<const uint8_t> data, int32_t width);
 
-  // Decodes the next row into (width + 7) / 8 bytes; bits behind the last pixel are 0. Ok;
-  // FileReadError when the data end before the row does, DamagedFile for a word that no encoder
-  // writes.
+  // Decodes the next row into (width + 7) / 8 bytes;
+  // padding bits are 0. Ok; FileReadError if the data
+  // are truncated, DamagedFile for an invalid code.
   Status DecodeRow(std::span<uint8_t> row);
 
  private:
@@ -31,19 +31,19 @@ class T6Decoder {
 
   std::span<const uint8_t> data_;
   const int32_t width_;
-  uint64_t bit_ = 0;                     // place of the next bit in the data
-  // columns where the color changes, white first; then the width, three times
+  uint64_t bit_ = 0;                     // bit offset in the data
+  // columns of the color changes, white to black first; then the width, three times
   std::vector<int32_t> above_, current_;
 };
 
-// Codes rows and gathers the bytes.
+// Encodes rows into a buffer.
 class T6Encoder {
  public:
-  explicit T6Encoder(int32_t width);  // `width` in pixels
+  explicit T6Encoder(int32_t width);  // in pixels
 
-  // Codes the next row of (width + 7) / 8 bytes.
+  // Encodes the next row of (width + 7) / 8 bytes.
   void EncodeRow(std::span<const uint8_t> row);
-  // Ends the picture; the bytes of the whole of it.
+  // Ends the picture; returns all of its bytes.
   const std::vector<uint8_t>& Finish();
 
  private:
@@ -53,7 +53,7 @@ class T6Encoder {
   const int32_t width_;
   std::vector<int32_t> above_, current_;
   std::vector<uint8_t> bytes_;
-  uint32_t pending_ = 0;   // bits that do not fill a byte yet
+  uint32_t pending_ = 0;   // bits of an incomplete byte
   int32_t pendingBits_ = 0;
 };
 

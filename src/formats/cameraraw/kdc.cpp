@@ -3,16 +3,16 @@
 //   offset size  field
 //        0    4  "II" 42, 0 or "MM" 0, 42
 //        4    4  offset of the first directory
-//   a directory: 2 bytes: number of entries; entries of 12 bytes: tag, type (2 each), number of
-//   values (4), the value or its offset (4); then 4 bytes: the offset of the next directory, or 0
+//   directory: number of entries (2 bytes); entries of 12 bytes: tag, type (2 each), number of
+//   values (4), the value or its offset (4); then the offset of the next directory, or 0 (4)
 //
-// Directories describe the sensor's data, and small pictures beside them: a JPEG (tags 513 and 514,
-// or a single strip of compression 6 or 7), or a single strip of red, green, blue. How the sensor's
-// data are coded differs from camera to camera; LibRaw knows them.
+// Directories describe the sensor data, along with small preview pictures: a JPEG (tags 513 and
+// 514, or a single strip with compression 6 or 7), or a single strip of red, green, blue. The
+// encoding of the sensor data depends on the camera model; LibRaw handles it.
 //
-// Where LibRaw is missing or refuses a file, the largest of the small pictures is shown, and said
-// so. Nothing is written. Source: Adobe, "TIFF 6.0" (1992), and its Technical Note 1 on
-// subdirectories; LibRaw's documentation.
+// If LibRaw is missing or rejects a file, the largest preview is shown, with a note. Read-only.
+// Source: Adobe, "TIFF 6.0" (1992), and its Technical Note 1 on subdirectories; LibRaw's
+// documentation.
 #include "formats/cameraraw/kdc.h"
 
 #include <algorithm>
@@ -40,7 +40,7 @@ void SetFacts(int32_t width, int32_t height, PictureRecord& picture) {
   MakeDefaultPalette(&picture.palette, nullptr, kDisplayPalette);
 }
 
-// A row of red, green, blue as the image holds it.
+// Converts a row of red, green, blue to the image's byte order.
 void SwapRow(const uint8_t* rgb, std::span<uint8_t> bgr, int32_t width) {
   for (size_t i = 0; i < 3 * static_cast<size_t>(width); i += 3) {
     bgr[i] = rgb[i + 2];
@@ -49,7 +49,7 @@ void SwapRow(const uint8_t* rgb, std::span<uint8_t> bgr, int32_t width) {
   }
 }
 
-// The JPEG codec opens files. The record keeps its own file's name and size.
+// The JPEG codec opens files. The record keeps its own file name and size.
 Status LoadJpeg(const RawPreview& preview, const ReadRequest& request, bool decode,
                 PictureRecord& picture) {
   platform::TemporaryFile working;
@@ -81,7 +81,7 @@ Status LoadPreview(const RawPreview& preview, const ReadRequest& request, bool d
   return Status::Ok;
 }
 
-// The library's picture.
+// The picture decoded by LibRaw.
 Status LoadRaw(std::span<const uint8_t> file, const ReadRequest& request, bool decode,
                PictureRecord& picture) {
   RawFacts facts;
@@ -103,7 +103,7 @@ Status LoadRaw(std::span<const uint8_t> file, const ReadRequest& request, bool d
   return Status::Ok;
 }
 
-// Whether the preview is worth a try: the library has no picture, and nobody wanted it to stop.
+// Whether to try the preview: LibRaw failed, and the operation was not canceled.
 bool MayFallBack(Status status) {
   return status != Status::Ok && status != Status::FunctionCancelled &&
          status != Status::MemoryAllocationError;

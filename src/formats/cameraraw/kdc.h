@@ -5,11 +5,11 @@
 
 namespace fotomill {
 
-// Raw files of cameras that are built of TIFF's directories, such as Kodak's KDC. They are
-// developed by LibRaw where it is installed and knows the camera; else the preview that the camera
-// put beside the data is the picture. Statuses: FileOpenError (1), DamagedFile (2),
-// MemoryAllocationError (6), UnsupportedFormat (8) for an unknown camera and FeatureDisabled (22)
-// without LibRaw, both for files without a preview.
+// TIFF-based camera raw files, such as Kodak's KDC. Decoded by LibRaw if it
+// is installed and supports the camera; otherwise the embedded preview is
+// used. Statuses: FileOpenError (1), DamagedFile (2), MemoryAllocationError
+// (6), UnsupportedFormat (8) for an unknown camera and FeatureDisabled (22)
+// without LibRaw, both only for files without a preview.
 Status KdcInfo(PictureRecord& picture, const ReadRequest& request);
 Status KdcRead(PictureRecord& picture, const ReadRequest& request);
 

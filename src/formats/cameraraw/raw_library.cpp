@@ -11,16 +11,16 @@ namespace fotomill {
 
 namespace {
 
-// The functions used here are the same in all of these versions. Only they are called, so nothing
-// depends on how the library lays out its data.
+// The functions used are the same in all of these versions. No structures are accessed directly, so
+// their layout does not matter.
 constexpr const char* kLibraryNames[] = {"libraw.so.23", "libraw.so.20"};
 
-// processor time for a picture; damaged data may keep the decoder busy
+// CPU time per picture; damaged data may keep the decoder busy
 constexpr unsigned kSecondsToDescribe = 10, kSecondsAtLeast = 30;
 constexpr uint64_t kPixelsPerSecond = 500'000;
 
 struct RawHandle;  // the library's state for one file
-// A picture in the library's memory.
+// A picture in LibRaw's memory.
 struct RawImage {
   int32_t type;  // kBitmap for pixels
   uint16_t height, width, colors, bits;
@@ -28,7 +28,7 @@ struct RawImage {
   uint8_t data[1];
 };
 constexpr int32_t kBitmap = 2;
-// Its answers to failures that have a status of their own.
+// LibRaw errors with a specific status.
 constexpr int kUnsupported = -2, kNoMemory = -100007;
 using DataFault = void (*)(void* data, const char* file, int offset);
 
@@ -87,7 +87,7 @@ const RawLibrary& Library() {
   return library;
 }
 
-// The answer of the process apart: at the front of its block, in front of the pixels.
+// Reply of the worker process: at the start of its block, before the pixels.
 struct Answer {
   Status status = Status::DamagedFile;
   int32_t damaged = 0;
@@ -107,7 +107,7 @@ Status StatusOf(int answer) {
   }
 }
 
-// The library's facts of a camera begin with four bytes, then maker and model, 64 bytes each.
+// LibRaw's camera information starts with four bytes, then maker and model, 64 bytes each.
 void CameraName(const char* facts, std::span<char> name) {
   constexpr size_t kMaker = 4, kModel = 68, kMost = 64;
   std::string text(facts + kMaker, strnlen(facts + kMaker, kMost));
@@ -117,7 +117,7 @@ void CameraName(const char* facts, std::span<char> name) {
   name[count] = 0;
 }
 
-// One file in the library, closed at the end. Only in the process apart.
+// A file opened in LibRaw, closed by the destructor. Only used in the worker process.
 class OpenRaw {
  public:
   explicit OpenRaw(std::span<const uint8_t> file) : handle_(Library().init(0)) {
@@ -143,12 +143,12 @@ class OpenRaw {
     return facts.width > 0 && facts.height > 0 ? Status::Ok : Status::DamagedFile;
   }
 
-  // The pixels, of the size that `facts` has.
+  // Decodes the pixels, with the size in `facts`.
   Status Develop(const RawFacts& facts, std::span<uint8_t> pixels) {
     RETURN_IF_BAD(opened_);
     RETURN_IF_BAD(StatusOf(Library().unpack(handle_)));
     TakeBalance();
-    Library().setGamma(handle_, 0, 1 / 2.4F);  // the curve of sRGB
+    Library().setGamma(handle_, 0, 1 / 2.4F);  // the sRGB curve
     Library().setGamma(handle_, 1, 12.92F);
     RETURN_IF_BAD(StatusOf(Library().process(handle_)));
     int fault = 0;
@@ -167,7 +167,7 @@ class OpenRaw {
   bool Damaged() const { return damaged_ != 0; }
 
  private:
-  // The white balance that the camera chose, unless it tells none.
+  // Uses the camera's white balance, if there is one.
   void TakeBalance() {
     float factors[4];
     for (int i = 0; i < 4; ++i) factors[i] = Library().balance(handle_, i);
@@ -228,7 +228,7 @@ Status DescribeRaw(std::span<const uint8_t> file, const StopToken& stop, RawFact
 Status DevelopRaw(std::span<const uint8_t> file, const RawFacts& facts, const StopToken& stop,
                   RawPixels& pixels) {
   const uint64_t size = RowBytes(facts) * static_cast<uint64_t>(facts.height);
-  RETURN_IF_BAD(CheckFileMemory(2 * size));  // and the picture itself
+  RETURN_IF_BAD(CheckFileMemory(2 * size));  // plus the picture itself
   const auto seconds = static_cast<unsigned>(kSecondsAtLeast + size / 3 / kPixelsPerSecond);
   Answer answer;
   RETURN_IF_BAD(RunApartFor(file, &facts, seconds, stop, pixels.block, answer));

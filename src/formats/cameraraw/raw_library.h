@@ -11,34 +11,34 @@
 
 namespace fotomill {
 
-// The decoder of cameras' raw files is LibRaw, which is loaded with the first file that needs it
-// and may not be there. It trusts what it reads, so it works apart: a fault in the data that brings
-// it down is DamagedFile like any other.
+// Camera raw files are decoded by LibRaw, loaded when first
+// needed, if installed. It trusts its input, so it runs in a
+// worker process: a crash on bad data is reported as DamagedFile.
 bool HasRawLibrary();
-std::string RawLibraryVersion();  // "missing" without it
+std::string RawLibraryVersion();  // "missing" if not installed
 
-// What the library says of a file, upright as it develops it.
+// Properties of a file, after LibRaw has rotated it upright.
 struct RawFacts {
   int32_t width = 0, height = 0;  // pixels
   char camera[64] = {};           // maker and model, as text
 };
 
-// FeatureDisabled (22) without the library, UnsupportedFormat (8) for files of cameras that it does
-// not know, DamagedFile (2), MemoryAllocationError (6), FunctionCancelled (4).
+// FeatureDisabled (22) without LibRaw, UnsupportedFormat (8) for unsupported cameras, DamagedFile
+// (2), MemoryAllocationError (6), FunctionCancelled (4).
 Status DescribeRaw(std::span<const uint8_t> file, const StopToken& stop, RawFacts& facts);
 
-// A developed picture: rows from the top, red, green, blue.
+// A decoded picture: rows of red, green, blue, top row first.
 struct RawPixels {
   platform::SharedBlock block;
-  bool damaged = false;  // the data have faults; what they leave is there
+  bool damaged = false;  // parts of the data are damaged; the rest was decoded
   const uint8_t* Row(const RawFacts& facts, int32_t y) const;
 };
-// Develops a file that DescribeRaw knows, with the camera's own white balance, into sRGB. Statuses
-// as above.
+// Decodes a file described by DescribeRaw to sRGB, with the camera's white balance.
+// Statuses as above.
 Status DevelopRaw(std::span<const uint8_t> file, const RawFacts& facts, const StopToken& stop,
                   RawPixels& pixels);
 
-// The part of it that runs apart: a row of the program's table of such work.
+// The task for the worker process, a row of the program's task table.
 bool RunRawTask(const platform::ApartCall& call);
 inline constexpr platform::ApartTask kRawTask = {"raw-decode", RunRawTask};
 

@@ -29,7 +29,7 @@ enum Tag : uint16_t {
   kJpegBytes = 514,
 };
 
-// What of one directory matters; of tags with several values the first.
+// The relevant fields of a directory; for tags with several values, the first.
 struct Directory {
   uint32_t width = 0, height = 0;
   uint32_t compression = 0, photometric = 0, samples = 0;
@@ -46,7 +46,7 @@ class DirectoryWalk {
     Add(Long(bytes));
   }
 
-  // The next directory; false behind the last. Each is visited once, however often it is named.
+  // The next directory; false at the end. Each is visited once, even if it is linked repeatedly.
   bool Next(Directory& directory) {
     if (visited_ >= places_.size()) return false;
     ByteReader bytes(file_);
@@ -114,7 +114,7 @@ bool IsJpeg(std::span<const uint8_t> bytes) {
   return bytes.size() > 3 && bytes[0] == 0xFF && bytes[1] == 0xD8 && bytes[2] == 0xFF;
 }
 
-// The preview that a directory describes, if it does.
+// The preview described by a directory, if any.
 RawPreview PreviewIn(std::span<const uint8_t> file, const Directory& directory) {
   RawPreview preview;
   preview.jpeg = PartOf(file, directory.jpegOffset, directory.jpegBytes);
@@ -152,7 +152,7 @@ bool FindRawPreview(std::span<const uint8_t> file, RawPreview& preview) {
   size_t most = 0;
   while (walk.Next(directory)) {
     const RawPreview found = PreviewIn(file, directory);
-    // A JPEG says more in the same number of bytes.
+    // JPEG data count more, as they are compressed.
     const size_t size = std::max(8 * found.jpeg.size(), found.rows.size());
     if (size <= most) continue;
     most = size;

@@ -5,17 +5,17 @@
 
 namespace fotomill {
 
-// A small picture that a camera put into its raw file: a JPEG file, or rows from the top of red,
-// green, blue.
+// An embedded preview: a JPEG file, or rows
+// of red, green, blue, top row first.
 struct RawPreview {
-  int32_t width = 0, height = 0;  // of rows; a JPEG tells its own
+  int32_t width = 0, height = 0;  // of `rows`; not used for JPEG
   std::span<const uint8_t> jpeg;
   std::span<const uint8_t> rows;
 };
 
-// Whether a file is built of TIFF's directories.
+// Whether a file is based on TIFF directories.
 bool IsRawFile(std::span<const uint8_t> file);
-// The largest preview in a file's directories; false when there is none that can be read.
+// The largest preview in a file's directories; false if there is no usable one.
 bool FindRawPreview(std::span<const uint8_t> file, RawPreview& preview);
 
 }  // namespace fotomill

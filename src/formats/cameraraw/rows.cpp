@@ -10,7 +10,7 @@ namespace {
 
 using namespace std::string_view_literals;
 
-// TIFF files begin in the same way, and are better known.
+// The same as TIFF, which is the better-known format.
 constexpr Signature kSignatures[] = {{0, "II\x2a\0"sv}, {0, "MM\0\x2a"sv}};
 
 constexpr FormatLibrary kLibraries[] = {

@@ -1,26 +1,26 @@
-// Pictures of Casio's QV cameras (CAM), big-endian: areas one after the other behind a table.
+// Pictures of Casio's QV cameras (CAM), big-endian: a table, then the areas it lists.
 //
 //   offset size  field
 //        0    4  magic number 07 20 4D 4D
-//        4    2  number of areas, mostly 3
-//        6       for each area: its number (2 bytes), its length (4), nothing (10)
+//        4    2  number of areas, usually 3
+//        6       for each area: its number (2 bytes), its length (4), unused (10)
 //
 // Area 1 is a comment and area 2 a thumbnail of 52 x 36, which is not used. The picture is in
-// area 3, or in another one if it is a whole JPEG file. Area 3 of the first cameras:
+// area 3, or in another one if that is a complete JPEG file. Area 3 of the first cameras:
 //
 //        0    2  number of the area
-//        2    6  lengths of the data of luma and of both chromas, 2 bytes each
-//        8  128  quantizers of luma and of chroma, in zigzag order
-//      136       the entropy-coded data of 480 x 240 pixels, one scan each; luma is sampled 3 x 2
+//        2    6  sizes of the luma data and of both chroma data, 2 bytes each
+//        8  128  quantization tables for luma and chroma, in zigzag order
+//      136       entropy-coded data of 480 x 240 pixels, one scan each; luma is sampled 3 x 2
 //
-// and of those that took 640 x 480 pixels, sampled 2 x 2:
+// and of later ones with 640 x 480 pixels, sampled 2 x 2:
 //
 //        4    4  length of the data
-//        8  128  quantizers
-//      136       the entropy-coded data, one scan
+//        8  128  quantization tables
+//      136       entropy-coded data, one scan
 //
-// What is left out of these are the heads and the Huffman tables of T.81, K.3. Pixels of 480 x 240
-// are narrower than they are high; the grid is shown as it is stored.
+// JPEG headers are omitted, as are the Huffman tables, which are those of T.81, K.3. Pixels of
+// 480 x 240 pictures are not square; they are shown as stored.
 // Sources: "QV-10 CAM Format" (1996, unofficial); K. Hayashi, J. Itoh, QVplay (1998); PRONOM
 // fmt/1772.
 #include "formats/casio/cam.h"
@@ -41,22 +41,22 @@ namespace {
 constexpr std::string_view kMagic("\x07\x20MM", 4);
 constexpr uint16_t kMostAreas = 64;
 constexpr uint16_t kComment = 1, kPicture = 3;
-constexpr uint64_t kUsualHead = 54;  // with three areas
+constexpr uint64_t kUsualHead = 54;  // header size with three areas
 constexpr uint64_t kScans = 136, kQuantizer = 64;
 
 struct CamFile {
   uint16_t areas = 0;
   std::string comment;
-  std::span<const uint8_t> jpeg = {};  // of a whole stream; in the file, or in `built`
+  std::span<const uint8_t> jpeg = {};  // a complete stream, in the file or in `built`
   std::vector<uint8_t> built;
-  bool narrow = false;  // pixels of two thirds of their height
+  bool narrow = false;  // pixel aspect ratio 2:3
 };
 
 bool BeginsJpeg(std::span<const uint8_t> bytes) {
   return bytes.size() >= 3 && bytes[0] == 0xFF && bytes[1] == 0xD8 && bytes[2] == 0xFF;
 }
 
-// Puts a JPEG stream together.
+// Assembles a JPEG stream.
 class StreamBuilder {
  public:
   explicit StreamBuilder(std::vector<uint8_t>& out) : out_(out) { out_ = {0xFF, 0xD8}; }
@@ -73,7 +73,7 @@ class StreamBuilder {
                            int{lumaSampling}, 0, 2, 0x11, 1, 3, 0x11, 1})
       out_.push_back(static_cast<uint8_t>(byte));
   }
-  // Of components `first` to `last`, numbered from 1.
+  // A scan of components `first` to `last`, numbered from 1.
   void Scan(uint8_t first, uint8_t last, std::span<const uint8_t> data) {
     const auto count = static_cast<uint8_t>(last - first + 1);
     Segment(0xDA, 4 + 2 * size_t{count});
@@ -99,7 +99,7 @@ class StreamBuilder {
   std::vector<uint8_t>& out_;
 };
 
-// FileReadError when the data are not all there.
+// FileReadError if the data are truncated.
 Status BuildPicture(std::span<const uint8_t> area, CamFile& cam) {
   ByteReader bytes(area);
   bytes.Skip(2);
@@ -108,7 +108,7 @@ Status BuildPicture(std::span<const uint8_t> area, CamFile& cam) {
   if (!bytes.Ok()) return Status::FileReadError;
   StreamBuilder stream(cam.built);
   stream.Quantizers(quantizers);
-  // the chromas of 480 x 240 cannot be without data
+  // the chroma of 480 x 240 pictures cannot be empty
   if (lengths[1] >= 8 && lengths[2] >= 8) {
     cam.narrow = true;
     stream.Frame(480, 240, 0x32);

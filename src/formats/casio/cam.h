@@ -6,7 +6,7 @@
 namespace fotomill {
 
 // Pictures of Casio's QV cameras. Statuses: FileOpenError (1), those of JpegRead, and NoImages (20)
-// for a file that holds no picture area.
+// for a file without a picture.
 Status CamInfo(PictureRecord& picture, const ReadRequest& request);
 Status CamRead(PictureRecord& picture, const ReadRequest& request);
 Status CamDetails(PictureRecord& picture);

@@ -1,12 +1,12 @@
-// DCX, a collection of PCX pictures, little-endian. Fax programs store a page in each.
+// DCX, a collection of PCX pictures, little-endian. Fax programs store one page in each.
 //
 //   offset size  field
 //        0    4  signature 0x3ADE68B1
-//        4  4 x n  offsets of the pages from the start of the file, 1023 at most, then 0
+//        4  4 x n  file offsets of the pages, at most 1023, then 0
 //        .       pages, each a PCX file
 //
-// A page ends where the next one in the file begins; the order of the offsets is that of the pages.
-// The writer leaves room for all offsets, as other programs do. Source: ZSoft Corporation, "PCX
+// A page ends where the next one in the file begins; pages are ordered as in the offset table. The
+// writer reserves space for all offsets, as other programs do. Source: ZSoft Corporation, "PCX
 // Technical Reference Manual", revision 5 (1991).
 #include "formats/dcx/dcx.h"
 
@@ -28,8 +28,8 @@ constexpr uint32_t kSignature = 0x3ADE68B1;
 constexpr size_t kMostPages = 1023;
 constexpr uint64_t kDirectorySize = 4 + 4 * (kMostPages + 1);
 
-// FileReadError for a file without room for a signature, DamagedFile, NoImages for a collection
-// without pages.
+// FileReadError if the signature is truncated, DamagedFile, NoImages for a
+// collection without pages.
 Status ReadDirectory(std::span<const uint8_t> head, std::vector<uint32_t>& pages) {
   ByteReader bytes(head);
   const uint32_t signature = bytes.Le32();
@@ -41,8 +41,8 @@ Status ReadDirectory(std::span<const uint8_t> head, std::vector<uint32_t>& pages
   return pages.empty() ? Status::NoImages : Status::Ok;
 }
 
-// Where a page of the file is. NoImages when there is no such page, FileReadError when it is
-// behind the end.
+// Position of a page in the file. NoImages if it does not exist, FileReadError if it is beyond the
+// end of the file.
 Status FindPage(const platform::FileView& file, int32_t page, PictureRecord& picture,
                 PcxPlace& place) {
   picture.typeName.Clear();

@@ -1,16 +1,16 @@
-// Dr. Halo (CUT), little-endian: 256 colors, which a palette file of the same name has.
+// Dr. Halo (CUT), little-endian: 256 colors, with the palette in a second file of the same name.
 //
 //   offset size  field
 //        0    4  width, height
 //        4    2  reserved
-//        6       rows from the top, each with the bytes of its code before it, 2 bytes
+//        6       rows, top first, each preceded by the size of its packed data, 2 bytes
 //
-// A code is made of 128 + count and a value for a run, of count and that many literal bytes, and
-// ends with 0. halo_palette.h has the palette.
+// Packed data are runs, 128 + count and a value, and literals, count and that many bytes; 0 ends
+// the row. For the palette see halo_palette.h.
 //
-// The reader fills what a row's code leaves open with 0, and drops what would go beyond it. Without
-// a palette the picture is gray. Source: J. Murray and W. vanRyper, "Encyclopedia of Graphics File
-// Formats", 2nd edition (1996).
+// The reader fills incomplete rows with 0, and cuts those that are too long. Without a palette the
+// picture is gray. Source: J. Murray and W. vanRyper, "Encyclopedia of Graphics File Formats", 2nd
+// edition (1996).
 #include "formats/drhalo/cut.h"
 
 #include <algorithm>
@@ -31,14 +31,14 @@ constexpr uint64_t kHeaderSize = 6;
 constexpr uint8_t kRun = 0x80, kCount = 0x7f;
 constexpr size_t kMostInToken = 127;
 constexpr size_t kShortestRun = 3;
-constexpr uint64_t kLeastRowSize = 2;  // the size of its code alone
+constexpr uint64_t kLeastRowSize = 2;  // the size field alone
 
 struct CutHeader {
   int32_t width = 0, height = 0;
 };
 
-// FileReadError for a short header; DamagedFile also for a reserved field in use, since nothing
-// else tells such files.
+// FileReadError for a truncated header; DamagedFile also if the reserved field is not 0, as there
+// is no other signature.
 Status ParseHeader(std::span<const uint8_t> file, CutHeader& header) {
   ByteReader bytes(file);
   header.width = bytes.Le16();
@@ -64,7 +64,7 @@ Status DescribePicture(const platform::FileView& file, const ReadRequest& reques
   return Status::Ok;
 }
 
-// FileReadError when the code ends within a token.
+// FileReadError if the data end within a token.
 Status DecodeRow(std::span<const uint8_t> code, std::span<uint8_t> row) {
   ByteReader bytes(code);
   for (size_t x = 0; bytes.Left() > 0;) {
@@ -112,7 +112,7 @@ void PutPlain(std::span<const uint8_t> bytes, std::vector<uint8_t>& code) {
 
 void EncodeRow(std::span<const uint8_t> row, std::vector<uint8_t>& code) {
   code.clear();
-  size_t plain = 0;  // where the bytes that no run has taken begin
+  size_t plain = 0;  // start of the pending literal bytes
   for (size_t x = 0; x < row.size();) {
     const size_t end = std::min(row.size(), x + kMostInToken);
     size_t next = x + 1;
@@ -129,7 +129,7 @@ void EncodeRow(std::span<const uint8_t> row, std::vector<uint8_t>& code) {
   code.push_back(0);
 }
 
-// UnsuitableImage when the code of a row is longer than its field can say.
+// UnsuitableImage if the packed data of a row are too long for the size field.
 Status WriteRows(ByteWriter& out, const PictureRecord& picture, const PackedImage& image) {
   out.Le16(static_cast<uint16_t>(image.Width()));
   out.Le16(static_cast<uint16_t>(image.Height()));

@@ -6,14 +6,14 @@
 
 namespace fotomill {
 
-// Dr. Halo pictures, whose palette is a second file of the same name. Statuses: FileOpenError (1),
-// DamagedFile (2), FileReadError (3) when data are cut short, MemoryAllocationError (6). A palette
-// that is missing or damaged leaves the picture gray; a damaged one is mentioned in `warning`.
+// Dr. Halo pictures, with the palette in a second file of the same name. Statuses: FileOpenError
+// (1), DamagedFile (2), FileReadError (3) if truncated, MemoryAllocationError (6). If the palette
+// is missing or damaged, the picture is gray; a damaged one sets `warning`.
 Status CutInfo(PictureRecord& picture, const ReadRequest& request);
 Status CutRead(PictureRecord& picture, const ReadRequest& request);
-// Writes both files or none. Also TooManyColors (12) above 8 bits, UnsuitableImage (13) for rows
-// that do not fit their fields, ErrorCreatingFile (10) also when the palette's name belongs to
-// another file, ErrorWritingFile (11).
+// Writes both files or none. Also TooManyColors (12) above 8 bits, UnsuitableImage (13) if rows do
+// not fit their size fields, ErrorCreatingFile (10) also if the palette's name is taken by another
+// file, ErrorWritingFile (11).
 Status CutWrite(PictureRecord& picture, const WriteOptions& options);
 
 }  // namespace fotomill

@@ -16,11 +16,11 @@ namespace {
 
 constexpr uint64_t kHeaderSize = 40, kColorSize = 6, kBlockSize = 512;
 constexpr uint64_t kFileSize = 4 * kBlockSize;    // of 256 colors
-constexpr uint64_t kMostBytes = 64 * kBlockSize;  // of a palette that is read at all
+constexpr uint64_t kMostBytes = 64 * kBlockSize;  // maximum size of a palette file
 constexpr std::string_view kMagic = "AH", kName = "Dr. Halo";
 constexpr uint16_t kVersion = 0xE3, kType = 10, kHighest = 255;
 
-// Where a color begins that would begin at `offset`.
+// The actual offset of a color that would start at `offset`.
 constexpr uint64_t ColorOffset(uint64_t offset) {
   return kBlockSize - offset % kBlockSize < kColorSize ? (offset / kBlockSize + 1) * kBlockSize
                                                        : offset;
@@ -67,7 +67,7 @@ void WriteColors(ByteWriter& out, const Palette& palette) {
   out.Le16(static_cast<uint16_t>(kFileSize - kHeaderSize));
   out.Le16(kType);
   out.Le32(0);
-  for (int i = 0; i < 4; ++i) out.Le16(kHighest);  // of the index and of three colors
+  for (int i = 0; i < 4; ++i) out.Le16(kHighest);  // for the index and three colors
   out.Text(kName);
   out.Zeros(kHeaderSize - out.Position());
   for (size_t i = 0; i < palette.size(); i += 3) {

@@ -3,19 +3,19 @@
 //
 //   offset size  content
 //        0   80  a card: keyword of up to 8 characters, "=" in column 9, value; the first keyword
-//        is SIMPLE
+//                is SIMPLE
 //       80   80  ...
 //        .   80  the last card, END
-//        .    .  from the next multiple of 2880: NAXIS2 rows, the top one first, of NAXIS1 values
-//        of |BITPIX| bits .    .  zeros up to a multiple of 2880
+//        .    .  at the next multiple of 2880: NAXIS2 rows, top first, of NAXIS1 values of |BITPIX|
+//                bits
+//        .    .  zero padding to a multiple of 2880
 //
-// Reads a card as its keyword up to the first blank or "=", then its value behind all blanks and
-// "="; a repeated keyword counts with its last value. Of more than two axes the first plane is read.
-// The picture shows the first bytes of each row as they are in the file, one byte a pixel, through
-// a gray palette: values wider than a byte show as their single bytes, and BSCALE and BZERO change
-// nothing.
+// A card is read as its keyword up to the first blank or "=", then its value after all blanks and
+// "="; the last value of a repeated keyword is used. With more than two axes, the first plane is
+// read. The first bytes of each row are shown unchanged, one byte per pixel, with a gray palette:
+// wider values are shown as their single bytes, and BSCALE and BZERO are ignored.
 //
-// Writes eleven cards and one byte of gray per pixel.
+// Writes eleven cards and one gray byte per pixel.
 //
 // Source: IAU FITS Working Group, "Definition of the Flexible Image Transport System (FITS)",
 // version 4.0 (2018).
@@ -49,17 +49,17 @@ constexpr size_t kMostDetailLines = 32;
 
 struct FitsCard {
   std::string_view keyword;
-  std::string_view value;  // with the blanks behind it
+  std::string_view value;  // including trailing blanks
 };
 
 struct FitsHeader {
-  // BITPIX without its sign; these numbers are as the file claims until CheckHeader
+  // absolute value of BITPIX; this and the next are unchecked until CheckHeader
   int64_t bitsPerValue = 1;
   int64_t axes = 0;
   int64_t width = 0;
   int64_t height = 0;
-  bool ended = false;       // END was met
-  uint64_t dataOffset = 0;  // where the values begin
+  bool ended = false;       // END was found
+  uint64_t dataOffset = 0;  // start of the data
 
   uint64_t RowBytes() const { return static_cast<uint64_t>(width * (bitsPerValue / 8)); }
 };
@@ -72,7 +72,7 @@ FitsCard ParseCard(std::span<const uint8_t> bytes) {
   return {text.substr(0, keywordEnd), text.substr(valueStart)};
 }
 
-// The next card. False when the data end first, or the header is longer than any real one.
+// The next card. False if the data end first, or the header is longer than any valid one.
 bool NextCard(ByteReader& bytes, FitsCard& card) {
   if (bytes.Position() >= limits.fitsCards * kCardBytes) return false;
   const auto cardBytes = bytes.Take(kCardBytes);
@@ -97,8 +97,8 @@ FitsHeader ParseHeader(std::span<const uint8_t> fileBytes) {
   return header;
 }
 
-// Ok; NoImages without a width or height; DamagedFile when a number is negative or absurd, or a
-// value has no whole byte.
+// Ok; NoImages without a width or height; DamagedFile if a number is negative or absurd, or a value
+// is not whole bytes.
 Status CheckHeader(const FitsHeader& header) {
   if (header.width == 0 || header.height == 0) return Status::NoImages;
   for (const int64_t number : {header.axes, header.width, header.height, header.bitsPerValue}) {
@@ -107,21 +107,20 @@ Status CheckHeader(const FitsHeader& header) {
   return header.bitsPerValue < 8 ? Status::DamagedFile : Status::Ok;
 }
 
-// As much of a row of the file as fits the row of the picture, which may take in bytes beyond its
-// pixels.
+// As much of a row of the file as fits into the picture's row, including its padding.
 void CopyRow(std::span<const uint8_t> fileRow, std::span<uint8_t> row) {
   const size_t count = std::min(fileRow.size(), row.size());
   std::memcpy(row.data(), fileRow.data(), count);
   std::memset(row.data() + count, 0, row.size() - count);
 }
 
-// So many hundredths of a level, rounded down. A product and a shift in place of a division:
-// compilers do that for many levels at once.
+// Hundredths of a level, rounded down. Multiply and shift instead of divide, so that compilers can
+// vectorize it.
 constexpr uint32_t Share(uint8_t level, uint32_t hundredths) {
   return level * ((hundredths * 65536 + 99) / 100) >> 16;
 }
 
-// Each channel's share is rounded for itself.
+// Each channel is rounded separately.
 constexpr uint32_t kRed = 30, kGreen = 59, kBlue = 11;
 constexpr uint8_t GrayOf(uint8_t red, uint8_t green, uint8_t blue) {
   return static_cast<uint8_t>(Share(red, kRed) + Share(green, kGreen) + Share(blue, kBlue));
@@ -137,7 +136,7 @@ static_assert([] {
 
 using GrayTable = std::array<uint8_t, 256>;
 
-// The grays of a picture's palette; entries that its depth cannot name are black.
+// Gray levels of a picture's palette; entries beyond its depth are black.
 GrayTable PaletteGrays(const PictureRecord& picture) {
   GrayTable grays{};
   const int32_t depth = std::clamp(picture.bitsPerPixel, 1, 8);
@@ -148,7 +147,7 @@ GrayTable PaletteGrays(const PictureRecord& picture) {
   return grays;
 }
 
-// Turn `count` pixels, of which the first is the first of a byte, into gray.
+// Convert `count` pixels, starting at the first pixel of a byte, to gray.
 void GrayBits(const uint8_t* pixels, const GrayTable&, size_t count, uint8_t* out) {
   for (size_t x = 0; x < count; ++x) out[x] = (pixels[x / 8] << x % 8 & 0x80) != 0 ? 255 : 0;
 }
@@ -162,7 +161,7 @@ void GrayBytes(const uint8_t* pixels, const GrayTable& grays, size_t count, uint
 }
 
 void GrayColors(const uint8_t* pixels, const GrayTable&, size_t count, uint8_t* out) {
-  // the formula runs over planes, which compilers turn into vectors
+  // the formula works on planes, so that compilers can vectorize it
   constexpr size_t kPiece = 1024;
   uint8_t blue[kPiece], green[kPiece], red[kPiece];
   for (size_t begin = 0; begin < count; begin += kPiece) {
@@ -206,7 +205,7 @@ void WriteHeader(ByteWriter& out, const PackedImage& image) {
   while (out.Position() < kBlockBytes) WriteCard(out, "");
 }
 
-// Parses the header and fills the record's facts.
+// Parses the header and fills in the record.
 Status DescribePicture(const platform::FileView& file, const ReadRequest&, FitsHeader& header,
                        PictureRecord& picture) {
   header = ParseHeader(file.Bytes());
@@ -221,7 +220,7 @@ Status DescribePicture(const platform::FileView& file, const ReadRequest&, FitsH
   return Status::Ok;
 }
 
-// Ok, or FileReadError when the header has no end or the file no room for its rows.
+// Ok, or FileReadError if the header has no end or the rows do not fit into the file.
 Status CheckRowsFit(const platform::FileView& file, const FitsHeader& header) {
   uint64_t size = 0, end = 0;
   const bool counted =
@@ -247,7 +246,7 @@ Status Decode(platform::FileView& file, const FitsHeader& header, const PictureR
 
 }  // namespace
 
-// Asks for the signature first, which `read` does without.
+// Checks the signature first, unlike `read`.
 Status FitsInfo(PictureRecord& picture, const ReadRequest& request) {
   picture.typeName.Clear();
   platform::FileView file;

@@ -1,8 +1,8 @@
-// FlashPix pictures (FPX). The file layout is described in fpx_file.cpp.
+// FlashPix pictures (FPX). For the file layout see fpx_file.cpp.
 //
-// The picture is the largest size of the first object; a smaller one that is enough serves as a
-// thumbnail. Grays become 8 bits, PhotoYCC and RGB 24. Colors that were multiplied with an opacity
-// are divided by it. What a view of the picture turns, crops or brightens is not done; the record's
+// The picture is the largest resolution of the first object; a smaller one that suffices is used
+// for thumbnails. Grays become 8 bits, PhotoYCC and RGB 24. Colors premultiplied by opacity are
+// divided by it. Rotation, cropping and color changes of a view are not applied; the record's
 // warning says so.
 #include "formats/flashpix/fpx.h"
 
@@ -48,8 +48,8 @@ Status OpenPicture(platform::FileView& file, const std::string& name, FpxFile& f
   return DescribePicture(fpx, size, picture);
 }
 
-// Takes the smallest size that is enough for a thumbnail, and is the picture halved as often as it
-// should be.
+// Selects the smallest resolution that suffices for a thumbnail, if it is the picture halved as
+// often as expected.
 void ChooseForThumbnail(const FpxFile& fpx, int32_t side, FpxSize& size, PictureRecord& picture) {
   for (int32_t index = 0; index < fpx.Sizes() - 1; ++index) {
     const int32_t halvings = fpx.Sizes() - 1 - index;
@@ -67,7 +67,7 @@ void ChooseForThumbnail(const FpxFile& fpx, int32_t side, FpxSize& size, Picture
   }
 }
 
-// Puts the tile that was decoded last in its place.
+// Copies the last decoded tile to its position.
 void PlaceTile(const FpxTileDecoder& decoder, const FpxSize& size, int32_t left, int32_t top,
                PackedImage& image, PackedImage& alpha) {
   const int32_t columns = std::min(size.tileWidth, size.width - left);
@@ -98,7 +98,7 @@ Status ReadTiles(const FpxFile& fpx, const FpxSize& size, const PictureRecord& p
   return Status::Ok;
 }
 
-// Whether the data can hold the tiles that are stored plainly, before memory is taken for them.
+// Whether the data are large enough for all uncompressed tiles; checked before allocating memory.
 bool DataAreThere(const FpxSize& size) {
   const uint64_t plain = static_cast<uint64_t>(size.tileWidth) *
                          static_cast<uint64_t>(size.tileHeight) *

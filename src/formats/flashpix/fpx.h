@@ -5,9 +5,9 @@
 
 namespace fotomill {
 
-// FlashPix pictures. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when data are
-// cut short, MemoryAllocationError (6), UnsupportedFormat (8) for colors and tiles that are not
-// decoded.
+// FlashPix pictures. Statuses: FileOpenError (1), DamagedFile (2),
+// FileReadError (3) if truncated, MemoryAllocationError (6),
+// UnsupportedFormat (8) for unsupported color spaces and tile formats.
 Status FpxInfo(PictureRecord& picture, const ReadRequest& request);
 Status FpxRead(PictureRecord& picture, const ReadRequest& request);
 Status FpxDetails(PictureRecord& picture);

@@ -1,36 +1,37 @@
 // The layout of FlashPix files (FPX), little-endian: a compound file with
 //
-//   Data Object Store 000001   the picture; of a view with changes, behind a transform
+//   Data Object Store 000001   the picture; for a view with changes, referenced by a transform
 //     \5Image Contents         a property set: sizes, colors, JPEG tables
-//     Resolution 0000 ...      from the smallest, each half of the next one
+//     Resolution 0000 ...      smallest first, each half the size of the next
 //       Subimage 0000 Header
 //       Subimage 0000 Data
 //
-// A property set: FFFE, version and system (6 bytes more), a class (16), the number of sections
-// (4), then of the first one its class (16) and offset (4). A section: its length, the number of
-// properties, and for each its number and offset in the section; there stand a type (4 bytes) and
-// the value. Properties that count, all but the first with a size or a table in their third byte:
+// Property set: FFFE, version and system (6 more bytes), a class id (16), the number of sections
+// (4), then for the first one its class id (16) and offset (4). Section: its length, the number of
+// properties, and for each its number and offset in the section; at that offset a type (4 bytes)
+// and the value. Relevant properties, all but the first with the index of a size or table in their
+// third byte:
 //
 //   01000000   number of sizes                     type 19, 4 bytes
 //   01000002   width and, as 01000003, height      the same
 //   02nn0002   colors                              type 65: length, then: pictures, channels (4
-//                                                  bytes each), and for each channel a number: in
-//                                                  bits 16 to 30 the color space, bit 15 with
-//                                                  opacity, 7FFE in the lower bits: opacity itself
+//                                                  bytes each), and for each channel a number: the
+//                                                  color space in bits 16 to 30, opacity flag in
+//                                                  bit 15; 7FFE in the lower bits: opacity channel
 //   03nn0001   JPEG tables                         type 65: length, an abbreviated stream
 //
-// The header of the tiles, behind 28 bytes:
+// Header of the tiles, after 28 bytes:
 //
 //        0    4  its length
 //        4    8  width, height
 //       12    4  number of tiles
 //       16    8  width and height of a tile, 64
 //       24    4  channels
-//       28    8  offset of the list of tiles, bytes of its entries, 16
-//                an entry: offset of the data from byte 28 of their stream, length, compression and
-//                its subtype, 4 bytes each
+//       28    8  offset of the tile table, size of its entries, 16
+//                entry: offset of the data relative to byte 28 of their stream, length, compression
+//                and its subtype, 4 bytes each
 //
-// Tiles at the right and lower edge are whole; what is outside of the picture does not count.
+// Tiles at the right and bottom edge are complete; pixels outside of the picture are ignored.
 // Source: Digital Imaging Group, FlashPix Format Specification 1.0.2 (1998).
 #include "formats/flashpix/fpx_file.h"
 
@@ -64,7 +65,7 @@ std::span<const uint8_t> Blob(std::span<const uint8_t> value) {
   return bytes.Take(length);
 }
 
-// The colors of the channels, all in one color space.
+// The channels' colors, all in one color space.
 Status ParseColors(std::span<const uint8_t> blob, FpxSize& size) {
   ByteReader bytes(blob);
   bytes.Skip(4);
@@ -88,7 +89,7 @@ Status ParseColors(std::span<const uint8_t> blob, FpxSize& size) {
   return gray || color ? Status::Ok : Status::UnsupportedFormat;
 }
 
-// The list of tiles; its number is what the size needs, whatever the file tells.
+// The tile table; its length is determined by the picture size, whatever the file says.
 Status ParseTiles(std::span<const uint8_t> header, FpxSize& size) {
   ByteReader bytes(header);
   bytes.Skip(kStreamHead + 12);

@@ -10,25 +10,25 @@
 
 namespace fotomill {
 
-// What of a FlashPix file describes its pictures. The layout is described in fpx_file.cpp.
+// The structure of a FlashPix file. For the layout see fpx_file.cpp.
 
 enum class FpxColors : uint8_t { Gray = 1, PhotoYcc = 2, Rgb = 3 };
 
 struct FpxTile {
-  uint64_t offset = 0, size = 0;  // of its data in the stream of tiles
+  uint64_t offset = 0, size = 0;  // of its data in the tile stream
   uint32_t compression = 0;       // 0 none, 1 one color, 2 JPEG
-  // of one color: its channels; of JPEG, from the lowest byte: interleaving, sampling of the
-  // chromas, 1 where the colors were turned to YCbCr, and the number of its tables
+  // single color: its channels; JPEG, from the lowest byte: interleaving, chroma subsampling, 1 if
+  // converted to YCbCr, and the number of its tables
   uint32_t subtype = 0;
 };
 
-// One of the sizes that a picture is stored in.
+// One of the stored resolutions.
 struct FpxSize {
   int32_t width = 0, height = 0;
   int32_t tileWidth = 64, tileHeight = 64;
   int32_t channels = 1;
   FpxColors colors = FpxColors::Gray;
-  bool opacity = false;  // is the last channel; colors are multiplied with it
+  bool opacity = false;  // the last channel is opacity; colors are premultiplied
   std::vector<FpxTile> tiles;
   CompoundStream data;
 
@@ -38,16 +38,16 @@ struct FpxSize {
 
 class FpxFile {
  public:
-  // `file` must stay.
+  // `file` must outlive this object.
   Status Open(std::span<const uint8_t> file);
   int32_t Sizes() const { return sizes_; }
-  int32_t Width() const { return width_; }  // of the largest size
+  int32_t Width() const { return width_; }  // of the largest resolution
   int32_t Height() const { return height_; }
-  // Whether a view of the picture turns or changes it, which is not done.
+  // Whether a view rotates or changes the picture; not applied.
   bool HasTransform() const { return transform_; }
-  // Size `index` from the smallest; the tiles only if `withTiles`.
+  // Resolution `index`, smallest first; tiles are read only if `withTiles`.
   Status ReadSize(int32_t index, bool withTiles, FpxSize& size) const;
-  // The JPEG tables of that number; empty without any.
+  // The JPEG tables with that number; empty if there are none.
   std::span<const uint8_t> JpegTables(uint32_t number) const;
 
  private:

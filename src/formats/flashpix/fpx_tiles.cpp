@@ -15,7 +15,7 @@ constexpr uint32_t kPlain = 0, kOneColor = 1, kJpeg = 2;
 
 uint8_t Limited(int32_t value) { return static_cast<uint8_t>(std::clamp(value, 0, 255)); }
 
-// The usual YCbCr of JPEG, in 65536ths.
+// JPEG's standard YCbCr conversion, in 1/65536.
 void YccToRgb(uint8_t* pixel) {
   const int32_t y = pixel[0] * 65536 + 32768, cb = pixel[1] - 128, cr = pixel[2] - 128;
   pixel[0] = Limited((y + 91881 * cr) >> 16);
@@ -95,7 +95,7 @@ Status FpxTileDecoder::DecodeJpeg(const FpxTile& tile) {
     fits = info.image_width == width_ && info.image_height == height_ &&
            static_cast<size_t>(info.num_components) == channels_;
     if (fits) {
-      info.jpeg_color_space = info.out_color_space = JCS_UNKNOWN;  // samples as they are stored
+      info.jpeg_color_space = info.out_color_space = JCS_UNKNOWN;  // no color conversion
       jpeg_start_decompress(&info);
       while (info.output_scanline < info.output_height) {
         JSAMPROW row = samples_.data() + info.output_scanline * width_ * channels_;
@@ -104,12 +104,12 @@ Status FpxTileDecoder::DecodeJpeg(const FpxTile& tile) {
       jpeg_finish_decompress(&info);
     }
   });
-  if (number == 0) tables_ = 0;  // its own tables are in force
+  if (number == 0) tables_ = 0;  // its own tables apply
   if (!decoded) return reader_.Failure();
   return fits ? Status::Ok : Status::DamagedFile;
 }
 
-// Colors were multiplied with their opacity.
+// Colors were premultiplied by opacity.
 void FpxTileDecoder::Divide() {
   for (size_t i = 0; i < opacities_.size(); ++i) {
     const uint32_t opacity = opacities_[i];
@@ -130,7 +130,7 @@ void FpxTileDecoder::ToPixels(bool fromYcc) {
   for (size_t i = 0; fromYcc && i < count; ++i) {
     uint8_t* pixel = &samples_[i * channels_];
     YccToRgb(pixel);
-    // with opacity, it is the negative that was turned to YCbCr
+    // with opacity, the negative was converted to YCbCr
     for (size_t c = 0; size_.opacity && c < 3; ++c) pixel[c] = static_cast<uint8_t>(255 - pixel[c]);
   }
   for (size_t y = 0; y < height_; ++y) {

@@ -9,16 +9,16 @@
 
 namespace fotomill {
 
-// Decodes the tiles of one size, one after the other, to rows as an image has them.
+// Decodes the tiles of one resolution, one at a time, to rows in image layout.
 class FpxTileDecoder {
  public:
-  // Both must stay.
+  // Both must outlive this object.
   FpxTileDecoder(const FpxFile& file, const FpxSize& size);
 
-  // DamagedFile, FileReadError when the data are not all there, UnsupportedFormat for another
-  // compression.
+  // DamagedFile, FileReadError if the data are truncated, UnsupportedFormat for
+  // unknown compression.
   Status Decode(const FpxTile& tile);
-  // Row `y` of the tile that was decoded last: grays, or blue, green, red; and its opacities.
+  // Row `y` of the last decoded tile: grays, or blue, green, red; and its opacity.
   std::span<const uint8_t> Pixels(int32_t y) const;
   std::span<const uint8_t> Opacities(int32_t y) const;
 
@@ -32,12 +32,12 @@ class FpxTileDecoder {
   const FpxFile& file_;
   const FpxSize& size_;
   const size_t width_, height_, channels_, colors_;
-  std::vector<uint8_t> samples_;  // as stored, channel by channel in each pixel
+  std::vector<uint8_t> samples_;  // as stored, channels interleaved
   std::vector<uint8_t> pixels_, opacities_;
   std::vector<uint8_t> gathered_;
   JpegReader reader_;
   bool created_ = false;
-  uint32_t tables_ = 0;  // whose number is in force
+  uint32_t tables_ = 0;  // number of the current tables
 };
 
 }  // namespace fotomill

@@ -2,32 +2,31 @@
 //
 //   offset size  field
 //        0    2  version, 1 to 3
-//        2    2  words of the header, from 8
+//        2    2  header size in words, at least 8
 //        4    2  planes
 //        6    2  bytes of a pattern, 1 to 8
 //        8    4  width and height of a pixel, micrometers
 //       12    4  width, height
-//       16       more of the header, as below
-//        .       lines from the top, coded as gem_lines.h tells; all planes of a row make a line,
-//        the
-//                lowest first, each (width + 7) / 8 bytes
+//       16       extended header, see below
+//        .       lines, top first, coded as described in gem_lines.h; a line consists of all planes
+//                of a row, lowest first, each (width + 7) / 8 bytes
 //
-// What programs added to the header, which standard files leave out:
+// Extensions of the header by various programs; standard files have none:
 //
-//   one word         of files with planes: 1 for grays, which changes nothing here
+//   one word         of files with planes: 1 for grays, ignored here
 //   "XIMG", model    2 bytes: 0 red, green, blue, 1 cyan, magenta, yellow; then three values of 2
 //                    bytes, 0 to 1000, for each color
-//   "STTT", count    2 bytes; then so many colors of the ST: 2 bytes 0RGB of 3 bits each, the STE's
-//                    lowest bit above them. Each plane is stored whole, one after the other.
-//   0x0080           2 bytes; then colors of the ST
-//   "TIMG", 3, r g b 2 bytes each: planes of red, green and blue, in that order
+//   "STTT", count    2 bytes; then that many ST colors: 2 bytes 0RGB of 3 bits each, with the STE's
+//                    lowest bit above them. Planes are stored one after the other.
+//   0x0080           2 bytes; then ST colors
+//   "TIMG", 3, r g b 2 bytes each: number of red, green and blue planes, in that order
 //
-// Pixel 0 is white without a palette, and the highest one black. More than 8 planes are whole
-// pixels one after the other: 16 bits of 5-6-5, 24 of red, green, blue, 32 with a byte in front.
+// Without a palette, pixel 0 is white and the highest one black. More than 8 planes are packed
+// pixels: 16 bits of 5-6-5, 24 of red, green, blue, 32 with a leading byte.
 //
-// The shape of pixels does not count. The writer stores black and white in the standard form, other
-// palettes as XIMG, and 24 bits as pixels with the standard header, which is what other programs
-// read; rows that are the same are stored once. Source: J. Murray and W. vanRyper, "Encyclopedia of
+// The pixel aspect ratio is ignored. The writer stores black and white in the standard form, other
+// palettes as XIMG, and 24 bits as packed pixels with the standard header, which other programs
+// support; repeated rows are stored once. Source: J. Murray and W. vanRyper, "Encyclopedia of
 // Graphics File Formats", 2nd edition (1996), with Digital Research's text; S. Sanders, "The Atari
 // Compendium" (1993), appendix C; Dr. Bob, "Understanding color IMGs" (1992).
 #include "formats/gem/gem.h"
@@ -53,12 +52,12 @@ namespace {
 constexpr uint64_t kHeaderSize = 16;
 constexpr uint64_t kMostHeaderSize = 2 * 65535;
 constexpr uint16_t kMostPattern = 8;
-constexpr uint16_t kPixelSize = 372;  // micrometers, as GEM Paint has it
-constexpr uint32_t kHighest = 1000;   // of a value of XIMG
+constexpr uint16_t kPixelSize = 372;  // micrometers, as written by GEM Paint
+constexpr uint32_t kHighest = 1000;   // maximum XIMG color value
 constexpr uint16_t kRgbModel = 0, kCmyModel = 1, kHyperPaint = 0x80;
 constexpr int kMostLineRepeats = 255;
 
-// How pixels are made of a line's bytes.
+// Layout of the pixels in a line.
 enum class Form { Planes, WholePlanes, ColorPlanes, Pixels };
 
 struct GemHeader {
@@ -67,7 +66,7 @@ struct GemHeader {
   uint16_t patternSize = 0;
   int32_t width = 0, height = 0;
   Form form = Form::Planes;
-  std::array<int32_t, 3> colorPlanes{};  // of TIMG
+  std::array<int32_t, 3> colorPlanes{};  // for TIMG
   const char* name = "GEM raster";
 
   size_t PlaneSize() const { return (static_cast<size_t>(width) + 7) / 8; }
@@ -78,7 +77,7 @@ struct GemHeader {
   }
 };
 
-// The colors of pixels without a palette, 0xRRGGBB.
+// The default palette, 0xRRGGBB.
 constexpr uint32_t kColors[] = {0xffffff, 0xff0000, 0x00ff00, 0xffff00, 0x0000ff, 0xff00ff,
                                 0x00ffff, 0xaaaaaa, 0x555555, 0xaa0000, 0x00aa00, 0xaaaa00,
                                 0x0000aa, 0xaa00aa, 0x00aaaa, 0x000000};
@@ -94,7 +93,7 @@ uint8_t ReverseBits(uint32_t byte) {
   return static_cast<uint8_t>(reversed);
 }
 
-// Above 16 colors pixels are grays whose lowest bit counts most, as snapshot programs wrote them.
+// Above 16 colors, pixels are grays with reversed bits, as written by snapshot programs.
 void SetStandardColors(int32_t planes, Palette& palette) {
   const size_t count = size_t{1} << planes;
   for (size_t i = 0; i < count; ++i) {
@@ -104,7 +103,7 @@ void SetStandardColors(int32_t planes, Palette& palette) {
   SetColor(palette, count - 1, 0);
 }
 
-// Values are 0 to 1000; CMY ones tell what is missing.
+// Values are 0 to 1000; CMY is inverted.
 bool ReadExtendedColors(ByteReader& bytes, size_t count, Palette& palette) {
   const uint16_t model = bytes.Be16();
   if (model != kRgbModel && model != kCmyModel) return false;
@@ -117,7 +116,7 @@ bool ReadExtendedColors(ByteReader& bytes, size_t count, Palette& palette) {
   return true;
 }
 
-// Colors of the ST have three bits; where the fourth is used it is the STE's lowest.
+// ST colors have three bits per channel; if the fourth is used, it is the STE's lowest.
 void ReadAtariColors(ByteReader& bytes, size_t count, Palette& palette) {
   std::vector<uint16_t> colors(std::min<size_t>(count, bytes.Left() / 2));
   for (uint16_t& color : colors) color = bytes.Be16();
@@ -129,7 +128,7 @@ void ReadAtariColors(ByteReader& bytes, size_t count, Palette& palette) {
   }
 }
 
-// Reads what comes behind the first 16 bytes of the header. UnsupportedFormat.
+// Parses the header after its first 16 bytes. UnsupportedFormat.
 Status ParseExtension(ByteReader& bytes, GemHeader& header, Palette& palette) {
   const size_t count = header.planes <= 8 ? size_t{1} << header.planes : 0;
   if (bytes.Match("XIMG")) {
@@ -161,7 +160,7 @@ Status ParseExtension(ByteReader& bytes, GemHeader& header, Palette& palette) {
   return Status::Ok;
 }
 
-// `file` begins with the whole header.
+// `file` must contain the complete header.
 Status ParseHeader(std::span<const uint8_t> file, GemHeader& header, Palette& palette) {
   ByteReader bytes(file);
   const uint16_t version = bytes.Be16();
@@ -196,7 +195,7 @@ Status DescribePicture(const platform::FileView& file, const ReadRequest&, GemHe
   return Status::Ok;
 }
 
-// A row of pixels that are stored whole.
+// Converts a row of packed pixels.
 void PutPixels(std::span<const uint8_t> line, int32_t planes, std::span<uint8_t> row) {
   const size_t size = static_cast<size_t>(planes) / 8, count = line.size() / size;
   if (planes == 24) {
@@ -217,7 +216,7 @@ void PutPixels(std::span<const uint8_t> line, int32_t planes, std::span<uint8_t>
   }
 }
 
-// A row of planes for each color.
+// Converts a row with separate planes for each color.
 void PutColorPlanes(std::span<const uint8_t> line, const GemHeader& header,
                     std::span<uint8_t> row) {
   std::vector<uint8_t> values(static_cast<size_t>(header.width));
@@ -232,7 +231,7 @@ void PutColorPlanes(std::span<const uint8_t> line, const GemHeader& header,
   }
 }
 
-// A row of indices; `indices` has room for one a byte.
+// Converts a row of indices; `indices` has room for one byte per pixel.
 void PutIndices(std::span<const uint8_t> line, const GemHeader& header, std::span<uint8_t> indices,
                 PackedImage& image, int32_t y) {
   const auto row = image.Row(y);
@@ -246,7 +245,7 @@ void PutIndices(std::span<const uint8_t> line, const GemHeader& header, std::spa
   if (!bytes) PackIndices(pixels.data(), header.width, image.Bits(), row.data());
 }
 
-// Reads planes that are stored whole into lines that hold a row of each.
+// Rearranges consecutively stored planes into lines with all planes of a row.
 Status GatherPlanes(GemLines& source, const GemHeader& header, std::vector<uint8_t>& lines) {
   const auto height = static_cast<size_t>(header.height),
              planes = static_cast<size_t>(header.planes);
@@ -296,11 +295,11 @@ bool IsBlackAndWhite(const Palette& palette) {
   return begins(BlackAndWhite(true)) || begins(BlackAndWhite(false));
 }
 
-// What the writer stores for a picture.
+// File layout for a picture to write.
 struct GemLayout {
   uint16_t planes = 24, patternSize = 3;
   bool extended = false;
-  uint8_t invert = 0;  // of black and white whose set bits are white
+  uint8_t invert = 0;  // for black and white where set bits are white
 };
 
 GemLayout ChooseLayout(const PictureRecord& picture) {
@@ -327,7 +326,7 @@ void WriteHeader(ByteWriter& out, const PictureRecord& picture, const GemLayout&
     out.Be16(static_cast<uint16_t>((picture.palette[i] * kHighest + 127) / 255));
 }
 
-// A line of the file from row y.
+// The file's line for row y.
 void MakeLine(const PackedImage& image, int32_t y, const GemLayout& layout,
               std::span<uint8_t> indices, std::span<uint8_t> line) {
   const auto row = image.Row(y);
@@ -350,7 +349,7 @@ Status WriteRows(ByteWriter& out, const PictureRecord& picture, const GemLayout&
   const PackedImage& image = picture.image;
   const auto width = static_cast<size_t>(image.Width());
   const size_t size = layout.planes == 24 ? 3 * width : (width + 7) / 8 * layout.planes;
-  const size_t part = layout.planes == 24 ? size : (width + 7) / 8;  // runs end with their plane
+  const size_t part = layout.planes == 24 ? size : (width + 7) / 8;  // runs do not cross planes
   std::vector<uint8_t> line(size), next(size), indices(width), code;
   MakeLine(image, 0, layout, indices, next);
   for (int32_t y = 0; y < image.Height() && !out.Failed();) {

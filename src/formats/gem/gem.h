@@ -6,9 +6,9 @@
 
 namespace fotomill {
 
-// GEM rasters. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when data are cut
-// short, MemoryAllocationError (6), UnsupportedFormat (8) for numbers of planes and color models
-// that are not read.
+// GEM rasters. Statuses: FileOpenError (1), DamagedFile (2),
+// FileReadError (3) if truncated, MemoryAllocationError (6),
+// UnsupportedFormat (8) for unsupported plane counts and color models.
 Status GemInfo(PictureRecord& picture, const ReadRequest& request);
 Status GemRead(PictureRecord& picture, const ReadRequest& request);
 // Also ErrorCreatingFile (10), ErrorWritingFile (11).

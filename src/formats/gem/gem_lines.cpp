@@ -9,8 +9,8 @@ namespace {
 
 constexpr uint8_t kPlain = 0x80, kOnes = 0x80, kRepeatMark = 0xff;
 constexpr size_t kMostPlain = 255, kMostPatterns = 255, kMostSolid = 127;
-constexpr size_t kShortestSolid = 3;     // bytes: it costs one, and two where it parts plain ones
-constexpr size_t kShortestPatterns = 5;  // bytes beyond the pattern itself
+constexpr size_t kShortestSolid = 3;     // bytes: a run costs one, and two more between literals
+constexpr size_t kShortestPatterns = 5;  // bytes in addition to the pattern itself
 
 void PutPlain(std::span<const uint8_t> bytes, std::vector<uint8_t>& code) {
   while (!bytes.empty()) {
@@ -22,7 +22,7 @@ void PutPlain(std::span<const uint8_t> bytes, std::vector<uint8_t>& code) {
   }
 }
 
-// How many bytes from `x` on repeat the ones `unit` before them.
+// Number of bytes from `x` on that equal those `unit` before them.
 size_t RepeatedBytes(std::span<const uint8_t> line, size_t x, size_t unit) {
   size_t next = x + unit;
   while (next < line.size() && line[next] == line[next - unit]) ++next;
@@ -77,7 +77,7 @@ bool GemLines::TakeToken() {
 }
 
 void EncodeGemLine(std::span<const uint8_t> line, size_t unit, std::vector<uint8_t>& code) {
-  size_t plain = 0;  // where the bytes that no run has taken begin
+  size_t plain = 0;  // start of the pending literal bytes
   for (size_t x = 0; x < line.size();) {
     const bool solid = line[x] == 0 || line[x] == 0xff;
     const size_t equal = solid ? RepeatedBytes(line, x, 1) + 1 : 0;

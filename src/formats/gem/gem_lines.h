@@ -9,15 +9,15 @@
 
 namespace fotomill {
 
-// The coding of GEM rasters, line by line. A line holds all planes of a row, one after the other.
+// Line coding of GEM rasters. A line consists of all planes of a row.
 //
-//   00 00 FF n     at the start of a line: the line comes n times
-//   00 n pattern   the pattern, whose length the header tells, n times
-//   80 n bytes     n bytes as they are
-//   n              n bytes of 0, with 80 added n bytes of FF
+//   00 00 FF n     at the start of a line: the line is repeated n times
+//   00 n pattern   n times the pattern, whose length is in the header
+//   80 n bytes     n literal bytes
+//   n              n bytes of 0, or with 80 added, n bytes of FF
 //
-// Snapshot programs wrote more: 80 00 stands for 256 bytes, and 00 00 n within a line for n + 1
-// bytes of the line above. Runs may go on into the next line. Source: J. Murray and W. vanRyper,
+// Extensions by snapshot programs: 80 00 stands for 256 bytes, and 00 00 n within a line for n + 1
+// bytes of the line above. Runs may continue into the next line. Source: J. Murray and W. vanRyper,
 // "Encyclopedia of Graphics File Formats", 2nd edition (1996), GEM Raster.
 class GemLines {
  public:
@@ -25,9 +25,9 @@ class GemLines {
   GemLines(std::span<const uint8_t> code, size_t lineSize, size_t patternSize)
       : bytes_(code), lineSize_(lineSize), patternSize_(patternSize) {}
 
-  // The next line, valid until the next call; empty when the code is cut short.
+  // The next line, valid until the next call; empty if the data are truncated.
   std::span<const uint8_t> Next();
-  uint64_t Position() const { return bytes_.Position(); }  // in the code
+  uint64_t Position() const { return bytes_.Position(); }  // offset in the data
 
  private:
   bool Fill();
@@ -35,13 +35,13 @@ class GemLines {
 
   ByteReader bytes_;
   const size_t lineSize_, patternSize_;
-  std::vector<uint8_t> line_;  // and behind its end what belongs to the next one
+  std::vector<uint8_t> line_;  // followed by bytes that belong to the next line
   std::vector<uint8_t> above_;
-  int repeats_ = 0;  // how often the line comes again
+  int repeats_ = 0;  // remaining repetitions of the line
 };
 
-// Appends the code of a line, without its repetitions. Patterns of `unit` bytes that come again
-// become runs; the header's pattern length is `unit`.
+// Appends an encoded line, without its repetitions. Repeated patterns of `unit` bytes become runs;
+// `unit` is the header's pattern length.
 void EncodeGemLine(std::span<const uint8_t> line, size_t unit, std::vector<uint8_t>& code);
 
 }  // namespace fotomill

@@ -9,24 +9,22 @@
 //       13       global palette: red, green, blue, then blocks:
 //
 //   0x2C  picture: left, top, width, height (2 bytes each), flags (0x80 local palette and its size,
-//   0x40 interlaced),
-//         the local palette, LZW data
+//         0x40 interlaced), the local palette, LZW data
 //   0x21  extension: label, then sub-blocks of 1 to 255 bytes and an empty one. 0xF9 graphic
-//   control: flags (bits 2-4
-//         disposal, bit 0 transparency), delay in 1/100 s (2 bytes), transparent index; 0xFE
-//         comment; 0xFF application
+//         control: flags (bits 2-4 disposal, bit 0 transparency), delay in 1/100 s (2 bytes),
+//         transparent index; 0xFE comment; 0xFF application
 //   0x3B  end
 //
 // Interlaced rows come in four passes: every 8th from 0, every 8th from 4, every 4th from 2, every
 // 2nd from 1.
 //
-// The reader shows a frame on the logical screen. A first frame that covers the screen and has no
+// The reader composes frames on the logical screen. A first frame that covers the screen and has no
 // transparent index keeps its palette at 1 to 8 bits; everything else becomes 24 bits with an alpha
-// plane, the uncovered screen transparent, as browsers show it. Frames beyond the screen are cut. A
-// file without any palette is read as grays. Bytes of no meaning between blocks are skipped. A
-// missing end code is no fault, missing pixels are (status 3).
+// plane, with the uncovered screen transparent, as in browsers. Frames are clipped to the screen.
+// Files without a palette are read as grays. Garbage between blocks is skipped. A missing end code
+// is accepted, missing pixels are not (status 3).
 //
-// The writer makes one frame, gif_sequence.cpp several; 89a with the picture's comment when
+// The writer creates one frame, gif_sequence.cpp several; 89a with the picture's comment if
 // CreateGif89 is on, interlaced rows with WriteGIFInterlaced. Source: CompuServe, "Graphics
 // Interchange Format, Version 89a" (1990); T. Welch, "A Technique for High-Performance Data
 // Compression", IEEE Computer 17 (1984).
@@ -53,12 +51,12 @@ using namespace gif;
 
 namespace {
 
-// Whether the screen and the frame leave a picture that can be shown with its own palette.
+// Whether the frame can be shown with its own palette.
 bool KeepsPalette(const GifScreen& screen, const GifFrame& frame, int32_t page) {
   return page == 0 && frame.transparent == kNoIndex && frame.Covers(screen);
 }
 
-// Facts of frame `page`, as far as its head tells. The reader stays behind that of the first one.
+// Header fields of frame `page`. The reader is left after the header of the first one.
 Status DescribePicture(ByteReader& bytes, int32_t page, GifScreen& screen, GifFrame& frame,
                        PictureRecord& picture) {
   RETURN_IF_BAD(ParseScreen(bytes, screen));
@@ -96,7 +94,7 @@ void PackRow(const uint8_t* indices, int32_t width, int32_t bits, uint8_t* row) 
   }
 }
 
-// A picture with its own palette.
+// Reads a picture with its own palette.
 Status ReadIndexed(ByteReader& bytes, const GifFrame& frame, const ReadRequest& request,
                    PictureRecord& picture, PackedImage& image) {
   platform::MemoryBlock pixels;
@@ -121,7 +119,7 @@ Status ReadIndexed(ByteReader& bytes, const GifFrame& frame, const ReadRequest& 
   return Status::Ok;
 }
 
-// Draws the frames up to the one that is asked for. NoImages when there are fewer.
+// Composes the frames up to the requested one. NoImages if there are fewer.
 Status ReadComposed(ByteReader& bytes, GifScreen& screen, GifFrame frame,
                     const ReadRequest& request, PictureRecord& picture, Canvas& canvas) {
   GifDrawing drawing;

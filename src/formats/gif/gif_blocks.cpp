@@ -11,7 +11,7 @@ using namespace gif;
 
 namespace {
 
-constexpr uint64_t kMostPixelsPerByte = 4096;  // more than LZW with 12-bit codes can ever reach
+constexpr uint64_t kMostPixelsPerByte = 4096;  // more than LZW with 12-bit codes can reach
 
 GifPalette ReadPalette(ByteReader& bytes, uint8_t flags) {
   if ((flags & 0x80) == 0) return {};
@@ -23,7 +23,7 @@ void SkipSubBlocks(ByteReader& bytes) {
   for (uint8_t size = bytes.U8(); size != 0; size = bytes.U8()) bytes.Skip(size);
 }
 
-// The text of an extension's sub-blocks.
+// The contents of an extension's sub-blocks.
 std::vector<uint8_t> TakeSubBlocks(ByteReader& bytes, uint64_t most) {
   std::vector<uint8_t> text;
   for (uint8_t size = bytes.U8(); size != 0; size = bytes.U8()) {
@@ -59,8 +59,8 @@ void ParseFrame(ByteReader& bytes, GifScreen& screen, GifFrame& frame) {
   if (screen.height == 0) screen.height = frame.top + frame.height;
 }
 
-// How often the frames are played: the block that began with one browser and that all programs
-// write since, in which sub-block 1 is a number of repetitions.
+// The number of loops: an application block introduced by one browser and now used by all programs;
+// sub-block 1 has the number of repetitions.
 void ParseApplication(ByteReader& bytes, GifRemarks& remarks) {
   const auto name = bytes.Take(bytes.U8());
   const auto is = [&](std::string_view text) { return std::ranges::equal(name, text); };

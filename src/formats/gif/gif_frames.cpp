@@ -12,8 +12,8 @@ using namespace gif;
 
 namespace {
 
-// Calls `visit(r, y, count)` for every row of the frame, as its own and the screen's, of which
-// `count` pixels lie on the screen.
+// Calls `visit(r, y, count)` for every row of the frame, r in the frame and y on the screen, with
+// `count` pixels on the screen.
 template <typename Visit>
 void ForVisibleRows(const GifFrame& frame, const Canvas& canvas, Visit visit) {
   const int32_t count = std::min(frame.width, canvas.image.Width() - frame.left);
@@ -22,7 +22,7 @@ void ForVisibleRows(const GifFrame& frame, const Canvas& canvas, Visit visit) {
   }
 }
 
-// The position of row y of a frame in its data.
+// The position in the data of each row of a frame.
 std::vector<int32_t> RowOrder(const GifFrame& frame) {
   std::vector<int32_t> order(static_cast<size_t>(frame.height));
   for (int32_t r = 0; r < frame.height; ++r) {
@@ -116,7 +116,7 @@ Status GifDrawing::Draw(ByteReader& bytes, const GifFrame& frame, Canvas& canvas
   return status;
 }
 
-// The place of a frame, row by row: colors, then alpha.
+// Saves the area below a frame, row by row: colors, then alpha.
 Status GifDrawing::KeepBeneath(const GifFrame& frame, const Canvas& canvas) {
   uint64_t size = 0;
   ForVisibleRows(frame, canvas, [&](int32_t, int32_t, size_t count) { size += 4 * count; });

@@ -10,7 +10,7 @@ namespace {
 constexpr uint32_t kMostCodes = 4096;
 constexpr uint32_t kMostCodeBits = 12;
 
-// Codes across sub-blocks.
+// Reads codes across sub-blocks.
 class CodeReader {
  public:
   explicit CodeReader(ByteReader& bytes) : bytes_(bytes) {}
@@ -48,8 +48,8 @@ struct DecodedString {
   uint32_t length;
 };
 
-// Copies forward byte by byte where the places overlap, as a string that ends in its own beginning
-// needs it.
+// Copies forward byte by byte if the ranges overlap, as needed for a string that repeats
+// its own start.
 void CopyString(uint8_t* to, const uint8_t* from, uint64_t length) {
   if (to - from >= static_cast<std::ptrdiff_t>(length)) {
     std::memcpy(to, from, length);
@@ -68,7 +68,7 @@ Status DecodeGifPixels(ByteReader& bytes, std::span<uint8_t> pixels, uint64_t* d
   DecodedString strings[kMostCodes];
   CodeReader codes(bytes);
   uint32_t codeBits = pixelBits + 1, nextCode = endCode + 1, code = 0;
-  DecodedString before{0, 0};  // the string decoded last; empty after a clear code
+  DecodedString before{0, 0};  // the previous string; empty after a clear code
   uint64_t none = 0;
   uint64_t& done = decoded != nullptr ? *decoded : none;
   done = 0;

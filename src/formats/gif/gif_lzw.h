@@ -9,26 +9,26 @@
 
 namespace fotomill {
 
-// The variable-length-code LZW of GIF: codes of up to 12 bits, least significant bit first, in
-// sub-blocks of up to 255 bytes that end in an empty one. The first byte is the number of bits of a
-// pixel, from 2 to 8.
+// GIF's variable-length LZW: codes of up to 12 bits, least significant
+// bit first, in sub-blocks of up to 255 bytes that end in an empty
+// one. The first byte is the number of bits per pixel, 2 to 8.
 
-// Decodes pixels.size() indices from `bytes`, which is at the first byte. Ok as soon as all
-// pixels are there, whether or not an end code follows; the reader is then left somewhere in the
-// data. DamagedFile for a code that cannot be or a pixel size outside 1 to 8, FileReadError when
-// the data end too early. `done`, which may be null: how many pixels were decoded in any case.
+// Decodes pixels.size() indices from `bytes`, which is at the first byte. Ok once all pixels are
+// decoded, with or without an end code; the reader is then left somewhere in the data. DamagedFile
+// for an invalid code or a pixel size outside 1 to 8, FileReadError if truncated. `done`, which may
+// be null, receives the number of decoded pixels in any case.
 Status DecodeGifPixels(ByteReader& bytes, std::span<uint8_t> pixels, uint64_t* done = nullptr);
 
-// Encodes indices of `bits` per pixel (1 to 8), handed over piece by piece in any lengths.
+// Encodes indices of `bits` per pixel (1 to 8), passed in pieces of any length.
 class GifPixelEncoder {
  public:
-  GifPixelEncoder(ByteWriter& out, int32_t bits);  // `bits` a pixel, 1 to 8
-  void Add(std::span<const uint8_t> pixels);  // indices, a byte each
-  // Writes what is pending, the end code and the empty block.
+  GifPixelEncoder(ByteWriter& out, int32_t bits);  // `bits` per pixel, 1 to 8
+  void Add(std::span<const uint8_t> pixels);  // indices, one byte each
+  // Writes pending bits, the end code and the empty block.
   void Finish();
 
  private:
-  static constexpr uint32_t kTableSize = 16384;  // four times the codes, so that probes are short
+  static constexpr uint32_t kTableSize = 16384;  // four times the codes, for short probes
   static constexpr int32_t kNone = -1;
 
   void PutCode(uint32_t code);
@@ -39,8 +39,8 @@ class GifPixelEncoder {
   const uint32_t clearCode_;
   uint32_t codeBits_ = 0;
   uint32_t nextCode_ = 0;
-  int32_t prefix_ = kNone;  // code of the string read so far
-  uint64_t pending_ = 0;    // bits not yet written, the oldest lowest
+  int32_t prefix_ = kNone;  // code of the current string
+  uint64_t pending_ = 0;    // unwritten bits, oldest lowest
   uint32_t pendingBits_ = 0;
   uint8_t block_[255];
   size_t blockSize_ = 0;

@@ -1,7 +1,7 @@
-// GIF files with several frames. Each frame is the part of the screen that differs from the frame
-// before it; within that part, pixels that stay the same are transparent where the palette has
-// room, which compresses well. Where a pixel becomes transparent, the frame before covers the whole
-// screen and is cleared away. So a frame can only be written when the one behind it is known.
+// GIF files with several frames. Each frame is the part of the screen that differs from the
+// previous frame; within it, unchanged pixels become transparent if the palette has an entry left,
+// which compresses well. If a pixel turns transparent, the previous frame must cover the whole
+// screen and be cleared. Therefore a frame can only be written when the next one is known.
 #include <algorithm>
 #include <cstring>
 #include <memory>
@@ -25,7 +25,7 @@ namespace {
 constexpr int32_t kMostColors = 256;
 constexpr uint8_t kOpaqueFrom = 128;  // half of full opacity
 
-// Makes pixels either transparent, and black, or opaque.
+// Makes all pixels either transparent black or opaque.
 void MakeSharp(Canvas& canvas) {
   for (int32_t y = 0; y < canvas.image.Height(); ++y) {
     uint8_t* colors = canvas.image.Row(y).data();
@@ -37,8 +37,8 @@ void MakeSharp(Canvas& canvas) {
   }
 }
 
-// The colors of opaque pixels. False when there are more than a palette holds, with an entry for
-// transparency if there are transparent pixels.
+// The colors of opaque pixels. False if there are too many for a palette, counting an entry for
+// transparency if needed.
 bool CollectColors(const Canvas& canvas, ColorSet& colors, bool& transparent) {
   std::vector<uint8_t> row;
   transparent = false;
@@ -66,7 +66,7 @@ bool AnyClears(const Canvas& before, const Canvas& after) {
   return false;
 }
 
-// A frame that waits for the one behind it.
+// A frame that is written when the next one is known.
 struct PendingFrame {
   Canvas canvas;
   ColorSet colors;
@@ -89,7 +89,7 @@ class GifSequence final : public SequenceWriter {
                                 picture.image.Height() != pending_->canvas.image.Height())) {
       return Status::UnsuitableImage;
     }
-    // three canvases: what is on the screen, the frame that waits, the new one; and an index each
+    // three canvases: the screen, the pending frame and the new one; and an index for each pixel
     const uint64_t pixels = static_cast<uint64_t>(picture.image.Width()) *
                             static_cast<uint64_t>(picture.image.Height());
     RETURN_IF_BAD(CheckFileMemory(13 * pixels));
@@ -125,13 +125,13 @@ class GifSequence final : public SequenceWriter {
     out_.Text("GIF89a");
     out_.Le16(static_cast<uint16_t>(width));
     out_.Le16(static_cast<uint16_t>(height));
-    out_.Zeros(3);  // no palette for all frames
+    out_.Zeros(3);  // no global palette
     if (facts_.animated && facts_.rounds != 1) WriteLoops();
     if (options_.KeepsMetadata()) WriteGifComment(out_, picture.comment);
     return NewCanvas(width, height, screen_);
   }
 
-  // How often frames are shown again; 0 for ever. Source: Netscape's application extension.
+  // The number of repetitions; 0 for endless. Source: Netscape's application extension.
   void WriteLoops() {
     const int32_t again = facts_.rounds == 0 ? 0 : std::min<int32_t>(facts_.rounds - 1, UINT16_MAX);
     out_.U8(kExtensionBlock);
@@ -144,14 +144,14 @@ class GifSequence final : public SequenceWriter {
     out_.U8(0);
   }
 
-  // `clear`: the screen is to be empty before the next frame.
+  // `clear`: the screen must be cleared before the next frame.
   Status WritePending(bool clear) {
     PendingFrame& frame = *pending_;
     const Rectangle area = clear || first_
                                ? Rectangle{0, 0, screen_.image.Width(), screen_.image.Height()}
                                : ChangedArea(screen_, frame.canvas);
     const int32_t used = frame.colors.Count();
-    // pixels that stay the same need no color if there is an entry left for them
+    // unchanged pixels need no color if there is a free entry
     const bool skips = !first_ && used < kMostColors;
     const bool transparent = frame.transparent || skips;
     Palette palette{};
@@ -212,9 +212,9 @@ class GifSequence final : public SequenceWriter {
   const SequenceFacts facts_;
   const WriteOptions options_;
   ByteWriter out_;
-  Canvas screen_;  // as the frames written so far leave it
+  Canvas screen_;  // after the frames written so far
   std::unique_ptr<PendingFrame> pending_;
-  bool first_ = true;  // nothing is on the screen yet
+  bool first_ = true;  // the screen is still empty
 };
 
 }  // namespace

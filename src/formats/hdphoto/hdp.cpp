@@ -1,14 +1,13 @@
-// HD Photo, also known as JPEG XR: hdp_file.cpp has the layout, hdp_codec.cpp the door to the
-// library, hdp_write.cpp writes.
+// HD Photo, also known as JPEG XR: the layout is described in hdp_file.cpp, hdp_codec.cpp calls the
+// library, hdp_write.cpp is the writer.
 //
-// What the reader makes of it: one bit stays one bit, grays become 8 bits, everything else 24 bits,
-// with an alpha plane where the file has alpha; colors that were multiplied by it are divided
-// again. Whole numbers of more than 8 bits are rounded; real numbers and those with a binary point
-// are linear light and get the curve of sRGB, 0 being black and 1 white. CMYK is turned into RGB by
-// the usual formula. Brightness and color differences that were never RGB (video) are refused, as
-// are pictures of other channels. The turn is not applied: it travels in an EXIF block. XMP, ICC
-// profile, description, EXIF and resolution travel with the picture. Further pages are read by
-// number. Source: ITU-T T.832 (2019); IEC 61966-2-2 for the linear ranges.
+// Reader: bilevel stays bilevel, grays become 8 bits, everything else 24 bits, with an alpha plane
+// if the file has alpha; premultiplied colors are divided by alpha. Integers of more than 8 bits
+// are rounded; floating and fixed point values are linear light and converted to sRGB, 0 being
+// black and 1 white. CMYK is converted to RGB by the usual formula. Video YCbCr and other channels
+// are rejected. Rotation is not applied but stored in an EXIF block. XMP, ICC profile, description,
+// EXIF and resolution are kept. Further pages are read by number. Source: ITU-T T.832 (2019); IEC
+// 61966-2-2 for the linear ranges.
 #include "formats/hdphoto/hdp.h"
 
 #include <algorithm>
@@ -37,7 +36,7 @@ uint8_t Rounded(double value) {
                       : static_cast<uint8_t>(value * 255 + 0.5);
 }
 
-// Linear light, 0 to 1 in 65535 steps, on the curve of sRGB. Source: IEC 61966-2-1.
+// Linear light, 0 to 1 in 65535 steps, to sRGB. Source: IEC 61966-2-1.
 const std::vector<uint8_t>& SrgbCurve() {
   static const std::vector<uint8_t> curve = [] {
     std::vector<uint8_t> values(65536);
@@ -73,7 +72,7 @@ double HalfToReal(uint16_t half) {
                                 : value;
 }
 
-// A sample as a real number, 1 being white.
+// A sample as a floating point number, 1 being white.
 double RealSample(const uint8_t* source, HdpDepth depth) {
   switch (depth) {
     case HdpDepth::Fixed16: return Load<int16_t>(source) / kFixed16One;
@@ -89,8 +88,8 @@ bool IsLinear(HdpDepth depth) {
          depth == HdpDepth::Float;
 }
 
-// `count` samples of a row as bytes, `step` of which make a pixel, the last one being alpha when
-// there is alpha.
+// Converts `count` samples of a row to bytes; a pixel has `step` samples, the last one being alpha
+// if there is alpha.
 void SamplesToBytes(const uint8_t* row, HdpDepth depth, size_t count, size_t step, bool alpha,
                     uint8_t* target) {
   if (depth == HdpDepth::U16) {
@@ -107,8 +106,7 @@ void SamplesToBytes(const uint8_t* row, HdpDepth depth, size_t count, size_t ste
   }
 }
 
-// Pixels of 16 or 32 bits that hold three colors, the widths of which are given from the lowest bit
-// up: blue first.
+// 16 or 32-bit pixels with three colors, whose widths are given from the lowest bit up: blue first.
 void PackedToBytes(const uint8_t* row, HdpDepth depth, int32_t width, uint8_t* image) {
   const uint32_t outer = depth == HdpDepth::Rgb101010 ? 10 : 5;
   const uint32_t middle = depth == HdpDepth::Rgb101010 ? 10 : depth == HdpDepth::Rgb565 ? 6 : 5;
@@ -137,7 +135,7 @@ struct HdpTarget {
   PackedImage image, alpha;
 };
 
-// Turns rows of the raster into the picture's.
+// Converts rows of the raster to the picture's.
 class HdpConverter {
  public:
   HdpConverter(const HdpPage& page, const HdpRaster& raster, HdpTarget& target)
@@ -174,7 +172,7 @@ class HdpConverter {
     }
     const uint8_t* source = samples_;
     const auto width = static_cast<size_t>(form_.width), step = size_t{raster_.samples};
-    const size_t first = deep ? 2 : 0;  // deep colors come red first
+    const size_t first = deep ? 2 : 0;  // deep colors are red first
     switch (form_.colors) {
       case HdpColors::Gray:
         for (size_t x = 0; x < width; ++x, source += step) {
@@ -220,7 +218,7 @@ class HdpConverter {
   HdpTarget& target_;
   const bool multiplied_;
   std::vector<uint8_t> bytes_;        // one row's samples
-  const uint8_t* samples_ = nullptr;  // of the row in work
+  const uint8_t* samples_ = nullptr;  // of the current row
 };
 
 bool HasAlpha(const HdpPage& page) {

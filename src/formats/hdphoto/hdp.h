@@ -7,8 +7,8 @@
 namespace fotomill {
 
 // HD Photo. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3), MemoryAllocationError
-// (6), UnsupportedFormat (8) for colors that are no picture's, NoImages (20) for a page that is not
-// there. Reading and writing also FeatureDisabled (22) where the library is missing.
+// (6), UnsupportedFormat (8) for unsupported color formats, NoImages (20) if the page does not
+// exist. Reading and writing also FeatureDisabled (22) without the library.
 Status HdpInfo(PictureRecord& picture, const ReadRequest& request);
 Status HdpRead(PictureRecord& picture, const ReadRequest& request);
 Status HdpDetails(PictureRecord& picture);

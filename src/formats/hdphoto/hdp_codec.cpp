@@ -1,7 +1,7 @@
 #include "formats/hdphoto/hdp_codec.h"
 
 #include <jxrlib/windowsmediaphoto.h>
-// Common words that the library's header makes macros of.
+// The library's header defines these common words as macros.
 #undef Call
 #undef FailIf
 #undef Failed
@@ -19,11 +19,11 @@ namespace fotomill {
 namespace {
 
 constexpr char kLibraryName[] = "libjpegxr.so.0";
-constexpr int32_t kBlock = 16;            // rows that the library handles at a time
-// processor time for a picture; damaged data may keep the decoder busy
+constexpr int32_t kBlock = 16;            // rows processed by the library at a time
+// CPU time per picture; damaged data may keep the decoder busy
 constexpr unsigned kSecondsAtLeast = 20;
 constexpr uint64_t kPixelsPerSecond = 1'000'000;
-constexpr uint64_t kReadAhead = 3 * 4096;  // bytes that the decoder fetches before it needs them
+constexpr uint64_t kReadAhead = 3 * 4096;  // bytes that the decoder reads ahead
 constexpr U8 kNoAlpha = 0, kAlphaToo = 2;  // uAlphaMode
 
 struct JxrLibrary {
@@ -58,8 +58,8 @@ const JxrLibrary& Library() {
   return library;
 }
 
-// The library's door to a codestream in memory, or to a file being written. It holds its own
-// address, and stays in place.
+// The library's stream interface to a codestream in memory, or to a file being written. Stores its
+// own address, so it must not be moved.
 struct JxrStream : WMPStream {
   explicit JxrStream(std::span<const uint8_t> data) : WMPStream(), bytes(data) { Connect(); }
   explicit JxrStream(ByteWriter& file) : WMPStream(), out(&file), start(file.Position()) {
@@ -70,9 +70,9 @@ struct JxrStream : WMPStream {
 
   std::span<const uint8_t> bytes;
   ByteWriter* out = nullptr;
-  uint64_t start = 0;  // of the codestream in the file being written
+  uint64_t start = 0;  // offset of the codestream in the file being written
   size_t position = 0;
-  bool overrun = false;  // more was asked for than there is
+  bool overrun = false;  // a read went past the end
 
  private:
   static JxrStream& Of(WMPStream* stream) { return *static_cast<JxrStream*>(stream); }
@@ -84,8 +84,7 @@ ERR CloseNothing(WMPStream**) { return WMP_errSuccess; }
 void JxrStream::Connect() {
   Close = CloseNothing;
   EOS = [](WMPStream* stream) -> Bool { return Of(stream).position >= Of(stream).bytes.size(); };
-  // The library reads whole packets and so beyond the end of every file; what is not there is
-  // zeros.
+  // The library reads whole packets and so past the end of every file; missing bytes read as zeros.
   Read = [](WMPStream* stream, void* target, size_t count) -> ERR {
     JxrStream& self = Of(stream);
     const size_t left = self.bytes.size() - std::min(self.position, self.bytes.size());
@@ -117,8 +116,7 @@ void JxrStream::Connect() {
   };
 }
 
-// Samples of a pixel and bytes of a sample; 0 samples for what the library cannot hand out as
-// pixels.
+// Samples per pixel and bytes per sample; 0 samples if the library cannot deliver pixels.
 struct SampleShape {
   uint32_t samples, bytes;
 };
@@ -146,10 +144,10 @@ SampleShape ShapeOf(const HdpStream& stream) {
   }
 }
 
-// The request to the child process: the sizes of the codestreams, which are its input one behind
-// the other, and the raster.
+// The request to the child process: the sizes of the codestreams, which are concatenated in its
+// input, and the raster.
 struct DecodeRequest {
-  // bytes; without alphaSize, alpha comes with the colors if there is any
+  // bytes; without alphaSize, alpha, if any, is interleaved with the colors
   uint64_t imageSize = 0, alphaSize = 0;
   uint64_t stride = 0;
   int32_t width = 0, height = 0;
@@ -159,14 +157,14 @@ struct DecodeRequest {
   uint64_t RasterBytes() const { return stride * static_cast<uint64_t>(height); }
 };
 
-// One of the codestreams, and where it goes.
+// One of the codestreams, and its destination.
 struct DecodeJob {
   std::span<const uint8_t> stream;
   uint32_t firstSample = 0;
   bool alphaToo = false;
 };
 
-// Decodes one codestream into the raster; false when it cannot. Runs apart.
+// Decodes a codestream into the raster; false on failure. Runs in the worker process.
 bool DecodeStream(const DecodeJob& job, const DecodeRequest& request, std::span<uint8_t> raster,
                   const std::function<void(int32_t)>& tell, bool& overrun) {
   const JxrLibrary& library = Library();
@@ -194,7 +192,7 @@ bool DecodeStream(const DecodeJob& job, const DecodeRequest& request, std::span<
   buffer.cbStride = request.stride;
   const int32_t blocks = (request.height + kBlock - 1) / kBlock;
   bool decoded = true;
-  // each row of blocks is complete only with the next one
+  // each row of blocks is completed by the next one
   for (int32_t row = 0; decoded && row <= blocks; ++row) {
     size_t lines = 0;
     buffer.uiFirstMBRow = buffer.uiLastMBRow = static_cast<unsigned>(row);
@@ -219,7 +217,7 @@ Status MakeRaster(const HdpPage& page, HdpRaster& raster) {
              height = static_cast<uint64_t>(page.image.height);
   raster.stride = shape.bytes == 0 ? (width + 7) / 8 : width * raster.samples * shape.bytes;
   raster.stride = (raster.stride + 127) / 128 * 128;
-  constexpr uint64_t kShare = 2;  // the picture is held as well
+  constexpr uint64_t kShare = 2;  // the picture is in memory as well
   if (raster.stride > limits.packedBlockBytes / kShare / height)
     return Status::MemoryAllocationError;
   return raster.block.Allocate(raster.stride * height + 1) ? Status::Ok
@@ -318,7 +316,7 @@ Status EncodeHdp(const PackedImage& image, const HdpEncoding& encoding, ByteWrit
   CTXSTRCODEC context = nullptr;
   if (library.encodeInit(&info, &parameters, &context) != ICERR_OK || context == nullptr)
     return Status::ResourceError;
-  // The library takes bands of 16 rows from the top, the image stores its rows from the bottom.
+  // The library takes bands of 16 rows, top first; the image is stored bottom-up.
   platform::MemoryBlock band;
   bool done = band.Allocate(image.Stride() * kBlock);
   const bool room = done;

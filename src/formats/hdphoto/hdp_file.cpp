@@ -1,17 +1,16 @@
 // The file and the codestream of HD Photo, also known as JPEG XR.
 //
-//   "II", BC, version 0 or 1, offset of the first directory; directories are those of TIFF,
-//   little-endian
+//   "II", BC, version 0 or 1, offset of the first directory; TIFF directories, little-endian
 //
-//   codestream, bits from the most significant one of each byte down:
+//   codestream, bits are most significant first:
 //   "WMPHOTO" 0, version (4 bits: 1), subversion (4)
-//   tiles (1), frequency order (1), turn (3), index table (1), overlap (2)
+//   tiles (1), frequency order (1), rotation (3), index table (1), overlap (2)
 //   short numbers (1), long words (1), window (1), trimmed (1), stretched tiles (1), red and blue
-//   (1), multiplied (1), alpha (1) colors (4), depth (4), width - 1, height - 1 (16 bits each when
-//   short, else 32) with tiles: columns - 1, rows - 1 of them (12 each), the width of each column
-//   but the last, the height of each row but the last, in blocks of 16 pixels (8 bits each when
-//   short, else 16) with a window: hidden pixels above, left, below, right (6 each); to the next
-//   byte plane: internal colors (3), scaled (1), bands (4), what the colors need, quantizers ...
+//   (1), premultiplied (1), alpha (1), colors (4), depth (4), width - 1, height - 1 (16 bits each
+//   if short, else 32); with tiles: columns - 1, rows - 1 (12 each), the width of each column but
+//   the last, the height of each row but the last, in blocks of 16 pixels (8 bits each if short,
+//   else 16); with a window: hidden pixels above, left, below, right (6 each); byte-aligned plane:
+//   internal colors (3), scaled (1), bands (4), color-specific fields, quantizers ...
 // Source: ITU-T T.832 (2019), sections 8.3, 8.4 and annex A.
 #include "formats/hdphoto/hdp_file.h"
 
@@ -28,14 +27,14 @@ namespace fotomill {
 namespace {
 
 constexpr uint64_t kEntryBytes = 12;
-// of EXIF, by turn
+// EXIF orientation by rotation value
 constexpr uint8_t kOrientations[] = {1, 4, 2, 3, 6, 7, 5, 8};
-// pixels of a macroblock's side
+// macroblock size in pixels
 constexpr uint32_t kBlock = 16;
-// internal colors
+// internal color formats
 constexpr uint32_t kYuv420 = 1, kYuv422 = 2, kYuv444 = 3, kCmyk = 4, kChannels = 6;
 
-// Bits from the most significant one down; past the end they are 0 and the reader is short.
+// Most significant bit first; past the end, bits are 0 and the reader is marked short.
 class BitReader {
  public:
   explicit BitReader(ByteReader& bytes) : bytes_(bytes) {}
@@ -62,8 +61,8 @@ class BitReader {
   unsigned left_ = 0;
 };
 
-// The widths of all columns (or heights of all rows) of tiles but the last: each at least one
-// block, with one left over.
+// The widths of all tile columns (or heights of all rows) but the last: each at least one block,
+// with at least one block left for the last.
 bool TakeTileSides(BitReader& bits, uint32_t count, unsigned width, uint32_t blocks) {
   uint64_t sum = 0;
   bool valid = true;
@@ -75,9 +74,9 @@ bool TakeTileSides(BitReader& bits, uint32_t count, unsigned width, uint32_t blo
   return valid && (count == 1 || sum < blocks);
 }
 
-// The quantizers of one band; whether they change nothing.
+// The quantizers of one band; returns whether they are lossless.
 bool TakeQuantizers(BitReader& bits, uint32_t channels) {
-  // one for all, one for luma and one for chroma, or each its own
+  // one for all, one for luma and one for chroma, or one for each channel
   const uint32_t mode = channels > 1 ? bits.Take(2) : 0;
   const uint32_t count = mode == 0 ? 1 : mode == 1 ? 2 : channels;
   bool lossless = true;
@@ -87,7 +86,7 @@ bool TakeQuantizers(BitReader& bits, uint32_t channels) {
 
 void ParsePlane(BitReader& bits, HdpStream& stream) {
   const uint32_t colors = bits.Take(3);
-  const bool scaled = bits.Flag();  // coded with bits to spare, which costs the last ones
+  const bool scaled = bits.Flag();  // coded with extra bits, losing the lowest ones
   const uint32_t bands = bits.Take(4);
   uint32_t channels = colors == kCmyk ? 4 : colors == 0 ? 1 : 3;
   if (colors == kYuv420 || colors == kYuv422 || colors == kYuv444) bits.Take(8);
@@ -104,7 +103,7 @@ void ParsePlane(BitReader& bits, HdpStream& stream) {
     default: break;
   }
   bool lossless = bands == 0 && !scaled && bits.Flag() && TakeQuantizers(bits, channels);
-  // low and high frequencies, unless they use the quantizers before
+  // low and high frequencies, unless they reuse the previous quantizers
   for (int band = 0; band < 2; ++band) {
     if (lossless && !bits.Flag()) lossless = bits.Flag() && TakeQuantizers(bits, channels);
   }
@@ -119,7 +118,7 @@ bool IsKnown(HdpColors colors, HdpDepth depth) {
 struct HdpEntry {
   uint16_t tag = 0, type = 0;
   uint32_t count = 0, value = 0;
-  uint64_t place = 0;  // where the value itself is when it is short
+  uint64_t place = 0;  // offset of an inline value
 };
 
 HdpEntry TakeEntry(ByteReader& bytes) {
@@ -134,7 +133,7 @@ HdpEntry TakeEntry(ByteReader& bytes) {
   return entry;
 }
 
-// The bytes of an entry of single bytes; empty if they are outside the file.
+// The bytes of a byte-typed entry; empty if they are outside the file.
 std::span<const uint8_t> BytesOf(std::span<const uint8_t> file, const HdpEntry& entry) {
   const uint64_t offset = entry.count <= 4 ? entry.place : entry.value;
   return offset <= file.size() && entry.count <= file.size() - offset
@@ -142,7 +141,7 @@ std::span<const uint8_t> BytesOf(std::span<const uint8_t> file, const HdpEntry& 
              : std::span<const uint8_t>();
 }
 
-// Places the reader at the directory of a page, behind its count; 0 when there is none.
+// Moves the reader to the directory of a page, after its count; 0 if it does not exist.
 uint16_t FindDirectory(ByteReader& bytes, int32_t page) {
   if (!bytes.Match("II\xBC") || bytes.U8() > 1) return 0;
   for (int32_t i = 0;; ++i) {
@@ -159,8 +158,8 @@ struct Extent {
   uint32_t offset = 0, size = 0;
 };
 
-// What is there, as far as the file goes: some writers give wrong sizes, and a decoder says
-// itself what is missing.
+// Cut at the end of the file: some writers store wrong sizes, and the decoder reports
+// missing data itself.
 std::span<const uint8_t> Part(std::span<const uint8_t> file, const Extent& extent) {
   if (extent.offset == 0 || extent.offset >= file.size()) return {};
   const auto rest = file.subspan(extent.offset);
@@ -234,10 +233,10 @@ int32_t CountHdpPages(std::span<const uint8_t> file) {
     const uint16_t count = bytes.Le16();
     bytes.Skip(count * kEntryBytes);
     const bool whole = bytes.Ok();
-    // some writers leave the last link out
+    // some writers omit the last link
     const uint32_t next = bytes.Left() >= 4 ? bytes.Le32() : 0;
     if (!whole) break;
-    offset = next > offset ? next : 0;  // links that lead back would never end
+    offset = next > offset ? next : 0;  // links backward could form a loop
   }
   return pages;
 }
@@ -274,7 +273,7 @@ Status ParseHdpPage(std::span<const uint8_t> file, int32_t page, HdpPage& result
   }
   if (!bytes.Ok()) return Status::FileReadError;
   if (image.offset == 0) return Status::DamagedFile;
-  // A size of alpha may count from the start of the file: a common writer's mistake.
+  // The alpha size may wrongly be counted from the start of the file, a common error of writers.
   result.cutShort = uint64_t{image.offset} + image.size > file.size() || alpha.size > file.size();
   RETURN_IF_BAD(ParseHdpStream(Part(file, image), result.image));
   if (alpha.offset == 0) return Status::Ok;

@@ -9,7 +9,7 @@
 
 namespace fotomill {
 
-// What a pixel of an HD Photo codestream is made of.
+// Color format of an HD Photo codestream.
 enum class HdpColors : uint8_t {
   Gray = 0,
   Yuv420 = 1,
@@ -21,7 +21,7 @@ enum class HdpColors : uint8_t {
   Rgb = 7,
   Rgbe = 8
 };
-// How one sample of a channel is stored.
+// Sample format of a channel.
 enum class HdpDepth : uint8_t {
   WhiteIsOne = 0,
   U8 = 1,
@@ -37,57 +37,57 @@ enum class HdpDepth : uint8_t {
   BlackIsOne = 15,
 };
 
-// The head of a codestream, as far as a decoder must know it beforehand.
+// The parts of a codestream's header that are needed before decoding.
 struct HdpStream {
   std::span<const uint8_t> bytes;
   int32_t width = 0, height = 0;
   HdpColors colors = HdpColors::Gray;
   HdpDepth depth = HdpDepth::U8;
-  bool alpha = false;           // a plane of alpha goes with the colors
-  bool multiplied = false;      // colors were multiplied by alpha
-  bool frequencyOrder = false;  // coarse values of the whole picture come first, fine ones last
-  uint8_t overlap = 0;          // 0 to 2: how far blocks are smoothed into each other
+  bool alpha = false;           // interleaved alpha plane
+  bool multiplied = false;      // premultiplied alpha
+  bool frequencyOrder = false;  // low frequencies of the whole picture first
+  uint8_t overlap = 0;          // 0 to 2: smoothing between blocks
   uint32_t tiles = 1;
   bool lossless = false;       // every quantizer is 1
-  // how the colors are coded: 0 gray, 1 4:2:0, 2 4:2:2, 3 4:4:4, 4 CMYK, 6 any channels
+  // internal color format: 0 gray, 1 4:2:0, 2 4:2:2, 3 4:4:4, 4 CMYK, 6 any channels
   uint8_t internalColors = 0;
 };
 
-// Reads the head of a codestream and checks what a decoder would trust. FileReadError when it is
-// cut short, DamagedFile when it makes no sense.
+// Parses a codestream's header and checks what a decoder would trust. FileReadError if truncated,
+// DamagedFile if invalid.
 Status ParseHdpStream(std::span<const uint8_t> bytes, HdpStream& stream);
 
-// One picture of a file. The spans lie in the file.
+// One picture of a file. Spans point into the file.
 struct HdpPage {
   HdpStream image;
-  HdpStream alpha;        // a codestream of its own, without bytes when there is none
-  bool cutShort = false;  // the file ends before the codestreams do
+  HdpStream alpha;        // separate codestream, empty if there is none
+  bool cutShort = false;  // the file is truncated within the codestreams
   std::array<uint8_t, 16> pixelFormat{};
-  // 0 to 7: a quarter turn to the right (4), then columns (2) and rows (1) flipped
+  // 0 to 7: rotate by 90 degrees clockwise (4), then flip columns (2) and rows (1)
   uint32_t turn = 0;
   float dpiX = 0, dpiY = 0;
   std::span<const uint8_t> icc, xmp, description;
-  uint64_t directory = 0;  // where the page's own directory is, which may lead to those of EXIF
+  uint64_t directory = 0;  // offset of the page's directory, which may refer to those of EXIF
 };
 
-// The orientation of EXIF, 1 to 8, that a turn means, and back.
+// Converts a rotation value to an EXIF orientation, 1 to 8, and back.
 uint16_t OrientationOfTurn(uint32_t turn);
-uint32_t HdpTurn(uint16_t orientation);  // the library's number of an EXIF orientation
+uint32_t HdpTurn(uint16_t orientation);  // the rotation value of an EXIF orientation
 
-inline constexpr int32_t kMostHdpPages = 4096;  // more are not read
+inline constexpr int32_t kMostHdpPages = 4096;  // further pages are ignored
 
-// The number of pages, 0 when the file is no HD Photo.
+// The number of pages, 0 if the file is not HD Photo.
 int32_t CountHdpPages(std::span<const uint8_t> file);
 
-// Reads the directory of a page, from 0, and its codestreams' heads. NoImages when there is no such
-// page; else as above.
+// Parses the directory of a page, from 0, and its codestreams' headers. NoImages if it does not
+// exist; else as above.
 Status ParseHdpPage(std::span<const uint8_t> file, int32_t page, HdpPage& result);
 
-// The EXIF block of a page that was parsed: what a camera's directories say, and the turn as
-// orientation. Empty when there is nothing to say.
+// The EXIF block of a parsed page: a camera's directories, and the rotation as orientation.
+// May be empty.
 std::vector<uint8_t> HdpExifBlock(std::span<const uint8_t> file, const HdpPage& page);
 
-// The entries of a directory that both reader and writer know.
+// Directory entries used by both reader and writer.
 inline constexpr uint16_t kHdpDescription = 270, kHdpXmp = 700, kHdpIcc = 34675, kHdpExif = 34665,
                           kHdpGps = 34853;
 inline constexpr uint16_t kHdpPixelFormat = 0xBC01, kHdpOrientation = 0xBC02, kHdpWidth = 0xBC80,

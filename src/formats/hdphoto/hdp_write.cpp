@@ -1,6 +1,7 @@
-// The HD Photo writer: one page, its directory in front. Grays of 8 bits stay gray, everything else
-// becomes 24-bit RGB, coded 4:4:4 with the quantizer HDPCompression (0 loses nothing).
-// HDPWriteOptions with bit 0 set puts the picture into the order of frequencies: coarse values of
+// The HD Photo writer: one page, preceded by its directory. 8-bit grays stay gray, everything else
+// becomes 24-bit RGB, coded 4:4:4 with the quantizer HDPCompression (0 is lossless).
+// HDPWriteOptions bit 0 selects frequency order: low frequencies of the whole picture first. The
+// resolution is the picture's, else TiffResolution.
 // all of it first. Resolution is the picture's, else TiffResolution.
 #include <algorithm>
 #include <bit>
@@ -18,18 +19,18 @@ namespace fotomill {
 namespace {
 
 constexpr uint32_t kPixelFormatPlace = 8, kExifPlace = kPixelFormatPlace + 16;
-constexpr uint32_t kInFrequencyOrder = 1;  // of HDPWriteOptions
+constexpr uint32_t kInFrequencyOrder = 1;  // bit of HDPWriteOptions
 
-// Pixel formats 8-bit gray and 24-bit blue, green, red: one name with a number at its end.
+// Pixel format GUIDs for 8-bit gray and 24-bit blue, green, red, which differ in the last byte.
 constexpr uint8_t kPixelFormat[15] = {0x24, 0xC3, 0xDD, 0x6F, 0x03, 0x4E, 0xFE, 0x4B,
                                       0xB1, 0x85, 0x3D, 0x77, 0x76, 0x8D, 0xC9};
 constexpr uint8_t kGray8 = 0x08, kBgr24 = 0x0C;
 
-// The file's directory, with blocks behind it, each at an even place.
+// The file's directory, followed by data blocks at even offsets.
 class Directory {
  public:
   void Value(uint16_t tag, uint16_t type, uint32_t value) { Pointer(tag, type, 1, value); }
-  // An entry of `count` values that lie elsewhere in the file.
+  // An entry whose `count` values are elsewhere in the file.
   void Pointer(uint16_t tag, uint16_t type, uint32_t count, uint32_t offset) {
     entries_.push_back({tag, type, count, offset, {}});
   }
@@ -64,7 +65,7 @@ class Directory {
       out.Zeros(entry.block.size() % 2);
     }
   }
-  // Offset of the value of a written entry, for values that are known only later.
+  // File offset of a written entry's value, to be patched later.
   uint64_t PlaceOf(uint16_t tag) const {
     return std::find_if(entries_.begin(), entries_.end(),
                         [tag](const Entry& entry) { return entry.tag == tag; })
@@ -83,7 +84,7 @@ class Directory {
   std::vector<Entry> entries_;
 };
 
-// The picture as 8-bit gray levels, or as 24-bit colors.
+// The picture as 8-bit gray, or as 24-bit color.
 Status MakeSource(const PictureRecord& picture, bool gray, PackedImage& source) {
   const PackedImage& image = picture.image;
   BgrRows rows;
@@ -102,12 +103,11 @@ Status MakeSource(const PictureRecord& picture, bool gray, PackedImage& source) 
   return Status::Ok;
 }
 
-// What of a picture's EXIF goes into the file's own directory beside the pointers: texts on who,
-// when and with what.
+// EXIF to be stored in the file's own directory besides the pointers: author, date, camera.
 struct HdpMetadata {
   ExifDirectories exif;
   PlacedExif placed;
-  std::vector<uint8_t> comment;  // with a zero behind it
+  std::vector<uint8_t> comment;  // NUL-terminated
 };
 
 Directory MakeDirectory(const PictureRecord& picture, const WriteOptions& options,
@@ -146,12 +146,12 @@ Status WriteAll(ByteWriter& out, PictureRecord& picture, const WriteOptions& opt
   const bool gray = HasOnlyGrays(picture.palette, picture.image.Colors());
   PackedImage source;
   RETURN_IF_BAD(MakeSource(picture, gray, source));
-  // The EXIF directories come first, where their offset is known, then the file's own.
+  // The EXIF directories come first, as their offset is known then, followed by the file's own.
   HdpMetadata extra;
   if (keep) extra.exif = ParseExifBlock(picture.metadata.exif);
   if (keep && extra.exif.Empty() && !picture.metadata.exif.empty())
     picture.lostMetadata |= kLostExif;
-  // cameras leave out the zero that ends a text; other readers insist on it
+  // some cameras omit the terminating NUL; other readers require it
   for (ExifEntry& entry : extra.exif.first) {
     if (entry.type == kHdpText && (entry.value.empty() || entry.value.back() != 0))
       entry.value.push_back(0);
