@@ -11,28 +11,28 @@
 
 namespace fotomill {
 
-// A codec of files that hold one picture without alpha: a header, and rows behind it. What such
-// codecs have in common is in PlainInfo and PlainRead; what differs is here. `Header` is the
-// codec's own struct, which `describe` fills for `decode`.
+// A simple codec: files with one picture without alpha, stored as a header and rows. The common
+// part is in PlainInfo and PlainRead; the differences are here. `Header` is the codec's own struct,
+// set by `describe` and used by `decode`.
 template <typename Header>
 struct PlainCodec {
-  uint64_t headSize;  // bytes from the beginning of the file that are enough for `describe`
+  uint64_t headSize;  // bytes from the start of the file that `describe` needs
 
-  // Parses the header and fills the facts of the picture, SetPlainFacts among them. `file` may show
-  // no more than its head. Any status, which ends the operation.
+  // Parses the header and fills in the picture, calling SetPlainFacts. Only the head of `file` may
+  // be visible. Any status but Ok ends the operation.
   Status (*describe)(const platform::FileView& file, const ReadRequest& request, Header& header,
                      PictureRecord& picture);
 
-  // Checks that the file, of which all is visible, can hold what the header claims, then makes
-  // `image` and fills it, reporting each row. Any status; after a bad one `image` does not matter.
+  // Checks that the file, which is fully visible, is large enough for the header's claims, then
+  // allocates and fills `image`, reporting each row. Any status; on failure `image` is discarded.
   Status (*decode)(platform::FileView& file, const Header& header, const PictureRecord& picture,
                    PackedImage& image);
 };
 
-// Fills width, height, depth in bits and the estimate of bytes, and says that there is no alpha.
+// Sets width, height, depth in bits and the size estimate, with no alpha.
 void SetPlainFacts(PictureRecord& picture, int32_t width, int32_t height, int32_t bitsPerPixel);
 
-// The operation `info` of a codec. FileOpenError (1), or the status of `describe`.
+// A codec's `info` operation. FileOpenError (1), or the status of `describe`.
 template <typename Header>
 Status PlainInfo(const PlainCodec<Header>& codec, PictureRecord& picture,
                  const ReadRequest& request) {
@@ -44,8 +44,8 @@ Status PlainInfo(const PlainCodec<Header>& codec, PictureRecord& picture,
   return codec.describe(file, request, header, picture);
 }
 
-// The operation `read` of a codec. FileOpenError (1), the statuses of `describe` and `decode`, or
-// FileReadError (3) when another program cut the file short meanwhile.
+// A codec's `read` operation. FileOpenError (1), the statuses of `describe` and `decode`, or
+// FileReadError (3) if another program truncated the file meanwhile.
 template <typename Header>
 Status PlainRead(const PlainCodec<Header>& codec, PictureRecord& picture,
                  const ReadRequest& request) {

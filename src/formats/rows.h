@@ -6,8 +6,8 @@
 
 namespace fotomill {
 
-// The rows of each family, as its rows.cpp has them. Where a row is in the registry, and so
-// which one a name selects, is the registry's matter.
+// The rows of each family, from its rows.cpp. Their order, and so the row selected for a name, is
+// up to the registry.
 #define FAMILY(name) std::span<const FormatEntry> name##Rows();
 #include "formats/families.def"
 #undef FAMILY

@@ -1,9 +1,9 @@
-// Slow-scan television frames (HRZ): 256 x 240 pixels from the top, red, green, blue, of 6 bits in
-// a byte each; nothing else, so that a file is known by its size alone.
+// Slow-scan television frames (HRZ): 256 x 240 pixels, top row first, red, green, blue, one byte
+// each with 6 significant bits. There is no header, so files are identified by size only.
 //
-// The reader takes bytes whose upper bits are set by their lower six. The writer drops the lower
-// two bits of each color. Source: the format has no official description; "HRZ" in the Just Solve
-// the File Format Problem wiki (Archive Team).
+// The reader ignores the upper two bits of bytes. The writer drops the lower two bits of each
+// color. Source: there is no official description; "HRZ" in the Just Solve the File Format Problem
+// wiki (Archive Team).
 #include "formats/hrz/hrz.h"
 
 #include <array>
@@ -20,7 +20,7 @@ constexpr int32_t kWidth = kHrzWidth, kHeight = kHrzHeight;
 constexpr size_t kRowSize = 3 * kWidth;
 constexpr uint64_t kFileSize = kRowSize * kHeight;
 
-struct HrzHeader {};  // such files have none
+struct HrzHeader {};  // these files have no header
 
 constexpr uint8_t Widened(uint8_t level) {
   const uint8_t six = level & 63;

@@ -1,9 +1,9 @@
-// Windows animated cursors (ANI), RIFF of the form "ACON", little-endian. Its chunks:
+// Windows animated cursors (ANI), RIFF with form type "ACON", little-endian. Chunks:
 //
-//   anih   36 bytes, below
-//   rate   4 bytes a step: how long it is shown, in sixtieths of a second; optional
-//   seq    4 bytes a step: the number of its picture; optional, else the pictures in their order
-//   LIST   of type "fram": a chunk "icon" for each picture, a whole cursor or icon file
+//   anih   36 bytes, see below
+//   rate   4 bytes per step: its duration in 1/60 s; optional
+//   seq    4 bytes per step: the index of its picture; optional, default: pictures in file order
+//   LIST   of type "fram": a chunk "icon" for each picture, a complete cursor or icon file
 //   LIST   of type "INFO": title and author; not used
 //
 //   offset size  field of anih
@@ -11,13 +11,13 @@
 //        4    4  number of pictures
 //        8    4  number of steps
 //       12   16  width, height, bits per pixel and planes of pictures without a header
-//       28    4  how long a step is shown, in sixtieths of a second, for files without "rate"
-//       32    4  bit 0: the pictures are icon or cursor files; bit 1: there is a "seq"
+//       28    4  duration of a step in 1/60 s, for files without "rate"
+//       32    4  bit 0: the pictures are icon or cursor files; bit 1: there is a "seq" chunk
 //
-// The reader believes the chunks rather than the numbers of anih, which may be wrong or missing. An
-// animation ends in front of a step whose picture the file lacks. Pictures without a header, which
-// no program is known to have written, are refused. The writer makes one picture and one step of
-// it, a cursor with a mask. Source: Microsoft, "Multimedia Data Standards Update" (1994).
+// The reader trusts the chunks rather than the numbers in anih, which may be wrong or missing. An
+// animation ends before a step whose picture is missing. Pictures without a header, which no
+// program is known to write, are rejected. The writer creates one picture and one step, a cursor
+// with a mask. Source: Microsoft, "Multimedia Data Standards Update" (1994).
 #include "formats/icon/ani.h"
 
 #include <algorithm>
@@ -39,9 +39,9 @@ namespace fotomill {
 namespace {
 
 constexpr uint32_t kHeaderSize = 36;
-constexpr uint32_t kHasFileHeaders = 1;  // bit of its flags
+constexpr uint32_t kHasFileHeaders = 1;  // bit of the flags
 constexpr uint32_t kUsualRate = 10;      // sixtieths of a second
-constexpr uint64_t kListHead = 12;       // "LIST", its length, its type
+constexpr uint64_t kListHead = 12;       // "LIST", size, type
 
 struct AniStep {
   size_t picture = 0;
@@ -51,22 +51,22 @@ struct AniStep {
 struct AniFile {
   std::vector<std::span<const uint8_t>> pictures;  // icon files
   std::vector<AniStep> steps;
-  bool lacksPictures = false;  // that anih or steps speak of
+  bool lacksPictures = false;  // fewer than anih or the steps refer to
 };
 
-// The chunks of a file, as they were found.
+// The raw chunks of a file.
 struct AniChunks {
   std::span<const uint8_t> header, rates, sequence;
   std::vector<std::span<const uint8_t>> pictures;
 };
 
-// Lists are entered rather than skipped: some programs write a wrong length for the one with title
-// and author, which hides the rest of the file.
+// Lists are descended into rather than skipped: some programs write a wrong size for the one with
+// title and author, which would hide the rest of the file.
 AniChunks GatherChunks(std::span<const uint8_t> file) {
   AniChunks chunks;
   RiffWalk walk(file);
   RiffPlace chunk;
-  bool ofPictures = false;  // whether the last list is one of pictures
+  bool ofPictures = false;  // whether the current list is one of pictures
   while (walk.Next(chunk)) {
     const auto data = file.subspan(chunk.data, chunk.size);
     if (chunk.name == "anih") chunks.header = data;
@@ -75,7 +75,7 @@ AniChunks GatherChunks(std::span<const uint8_t> file) {
     if (chunk.name == "icon" && ofPictures && chunks.pictures.size() < limits.animationFrames)
       chunks.pictures.push_back(data);
     if (chunk.name == "LIST" && chunk.size >= 4) {
-      // The head of a list is as long as a file's: a walk from there begins with its first chunk.
+      // A list header is as large as a file header, so a walk can start there.
       static_assert(kListHead == kRiffHead);
       ofPictures = ByteReader(data).Match("fram");
       file = file.subspan(chunk.data - 8);
@@ -116,7 +116,7 @@ Status ParseAni(std::span<const uint8_t> file, AniFile& ani) {
   return ani.steps.empty() ? Status::NoImages : Status::Ok;
 }
 
-// Facts, and with `decode` the pixels, of a step's picture: its best entry.
+// Facts, and with `decode` the pixels, of a step's picture: the best entry of its icon.
 Status LoadStep(const AniFile& ani, const ReadRequest& request, bool decode,
                 PictureRecord& picture) {
   const auto step = static_cast<size_t>(request.page);

@@ -8,13 +8,13 @@
 namespace fotomill {
 
 // Windows animated cursors. The pages are the steps of the animation. Statuses: FileOpenError (1),
-// DamagedFile (2) for other files, NoImages (20) when there is no picture or no such step, and
-// those of the icons inside.
+// DamagedFile (2) for other files, NoImages (20) if there is no picture or no such step, and those
+// of the embedded icons.
 Status AniInfo(PictureRecord& picture, const ReadRequest& request);
 Status AniRead(PictureRecord& picture, const ReadRequest& request);
-// Each step on a canvas of the first one's size.
+// Places each step on a canvas of the first one's size.
 Status AniAnimate(const ReadRequest& request, AnimationPointer& animation);
-// Writes a cursor that stands still. ErrorCreatingFile (10), ErrorWritingFile (11).
+// Writes a static cursor. ErrorCreatingFile (10), ErrorWritingFile (11).
 Status AniWrite(PictureRecord& picture, const WriteOptions& options);
 
 }  // namespace fotomill

@@ -8,23 +8,23 @@
 //       +0    2  width and height, 0 for 256
 //       +2    2  number of colors, reserved
 //       +4    4  icons: planes and bits per pixel; cursors: hot spot x and y
-//       +8    4  bytes of the entry's picture
+//       +8    4  size of the entry's picture
 //      +12    4  its offset
 //
-// A picture is a whole PNG file, or a bitmap without file header: a 40-byte information header
-// whose height counts both of the following bitmaps, the palette of blue, green, red, 0, the colors
-// at 1, 4, 8, 16, 24 or 32 bits, then the AND mask at 1 bit (set: transparent). Rows run from the
-// bottom up, each padded to 4 bytes.
+// A picture is a complete PNG file, or a bitmap without file header: a 40-byte information header
+// whose height is that of both following bitmaps together, the palette of blue, green, red, 0, the
+// colors at 1, 4, 8, 16, 24 or 32 bits, then the AND mask at 1 bit (set: transparent). Rows are
+// stored bottom-up, each padded to 4 bytes.
 //
-// The reader takes the largest entry, among equals the deepest, by what the pictures themselves
-// say: the numbers in the entries are often wrong. A bitmap of up to 8 bits without a transparent
-// pixel keeps its palette; everything else becomes 24 bits with an alpha plane. The fourth byte of
-// 32-bit pixels is alpha unless it is 0 everywhere, as old programs left it; then the mask counts.
-// A mask that the file lacks is opaque.
+// The reader selects the largest entry, among equals the deepest, by the pictures' own headers: the
+// numbers in the entries are often wrong. A bitmap of up to 8 bits without a transparent pixel
+// keeps its palette; everything else becomes 24 bits with an alpha plane. The fourth byte of 32-bit
+// pixels is alpha unless it is 0 everywhere, as written by old programs; then the mask is used. A
+// missing mask is opaque.
 //
 // The writer stores one bitmap with its mask; 24 bits with an alpha plane as 32. ICOCompression
-// asks for a PNG file instead, for 256 x 256 pixels or for every size. Source: Microsoft, "Icons in
-// Win32" (J. Hornick, 1995); "The evolution of the ICO file format" (R. Chen, 2010).
+// selects PNG instead, for 256 x 256 pixels or for all sizes. Source: Microsoft, "Icons in Win32"
+// (J. Hornick, 1995); "The evolution of the ICO file format" (R. Chen, 2010).
 #include "formats/icon/ico.h"
 
 #include <algorithm>
@@ -55,8 +55,8 @@ constexpr uint32_t kFileHeaderSize = 6, kEntrySize = 16;
 
 struct IcoEntry {
   uint16_t hotSpotX = 0, hotSpotY = 0;  // of a cursor
-  uint16_t claimedBits = 32;            // of the directory, for pictures that do not tell
-  std::span<const uint8_t> bytes;       // its picture, and all that follows in the file
+  uint16_t claimedBits = 32;            // from the directory, for pictures without their own
+  std::span<const uint8_t> bytes;       // from the start of its picture to the end of the file
 };
 
 struct IcoFile {
@@ -77,10 +77,10 @@ Status ParseDirectory(std::span<const uint8_t> file, IcoFile& icons) {
     entry.hotSpotY = bytes.Le16();
     entry.claimedBits =
         icons.cursors || entry.hotSpotY == 0 || entry.hotSpotY > 32 ? uint16_t{32} : entry.hotSpotY;
-    bytes.Skip(4);  // the size is often wrong; the picture itself knows better
+    bytes.Skip(4);  // the size is often wrong and not needed
     const uint64_t offset = bytes.Le32();
     if (!bytes.Ok()) return Status::FileReadError;
-    if (offset >= file.size()) continue;  // points nowhere; the others may be good
+    if (offset >= file.size()) continue;  // past the end; other entries may be valid
     entry.bytes = file.subspan(offset);
     icons.entries.push_back(entry);
   }
@@ -89,10 +89,10 @@ Status ParseDirectory(std::span<const uint8_t> file, IcoFile& icons) {
 
 // A bitmap entry, parsed.
 struct IcoBitmap {
-  int32_t width = 0, height = 0;  // of the picture, not of both bitmaps
+  int32_t width = 0, height = 0;  // of the picture, not of both bitmaps together
   uint16_t bits = 0;
   uint32_t compression = 0;
-  std::span<const uint8_t> palette, colors, mask;  // mask: empty when the file lacks it
+  std::span<const uint8_t> palette, colors, mask;  // mask: empty if missing
 
   uint64_t Stride() const { return RowStride(width, bits); }
   std::span<const uint8_t> Row(int32_t r) const {
@@ -107,8 +107,8 @@ struct IcoBitmap {
   }
 };
 
-// Ok; DamagedFile for a header that makes no sense, UnsupportedFormat for compression,
-// FileReadError for missing colors.
+// Ok; DamagedFile for an invalid header, UnsupportedFormat for compression, FileReadError if the
+// colors are truncated.
 Status ParseBitmap(std::span<const uint8_t> entry, IcoBitmap& bitmap) {
   ByteReader bytes(entry);
   const uint32_t infoSize = bytes.Le32();
@@ -143,11 +143,11 @@ bool IsPng(std::span<const uint8_t> entry) {
          std::equal(std::begin(kPngSignature), std::end(kPngSignature), entry.begin());
 }
 
-// How good an entry is: its area first, then its depth; 0 for one that cannot be read.
+// Rank of an entry: by area, then by depth; 0 if it cannot be read.
 uint64_t Rank(const IcoEntry& entry) {
   if (IsPng(entry.bytes)) {
     ByteReader bytes(entry.bytes);
-    bytes.Seek(16);  // width and height of the first chunk
+    bytes.Seek(16);  // width and height in the first chunk
     const uint64_t width = bytes.Be32(), height = bytes.Be32();
     return width > UINT16_MAX || height > UINT16_MAX ? 0 : width * height * 64 + entry.claimedBits;
   }
@@ -157,7 +157,7 @@ uint64_t Rank(const IcoEntry& entry) {
          bitmap.bits;
 }
 
-// Entry number `page` from the best one down; null beyond the last.
+// Entry `page` in order of rank; null past the end.
 const IcoEntry* ChooseEntry(IcoFile& icons, int32_t page) {
   std::ranges::stable_sort(icons.entries, std::greater(), Rank);
   return static_cast<size_t>(page) < icons.entries.size()
@@ -174,7 +174,7 @@ bool AnyMasked(const IcoBitmap& bitmap) {
   return false;
 }
 
-// Whether the fourth bytes of 32-bit pixels say anything.
+// Whether any fourth byte of 32-bit pixels is nonzero.
 bool HasAlphaBytes(const IcoBitmap& bitmap) {
   if (bitmap.bits != 32) return false;
   for (size_t i = 3; i < bitmap.colors.size(); i += 4) {
@@ -206,7 +206,7 @@ void DescribeBitmap(const IcoBitmap& bitmap, PictureRecord& picture) {
 
 uint8_t FiveToEight(uint32_t value) { return static_cast<uint8_t>(value << 3 | value >> 2); }
 
-// The color of column x as blue, green, red.
+// The color at column x as blue, green, red.
 void ColorAt(const IcoBitmap& bitmap, std::span<const uint8_t> row, size_t x, uint8_t* color) {
   if (bitmap.bits == 16) {
     const uint32_t value = static_cast<uint32_t>(row[2 * x] | row[2 * x + 1] << 8);
@@ -249,7 +249,7 @@ Status ReadBitmap(const IcoBitmap& bitmap, PictureRecord& picture, PackedImage& 
   return Status::Ok;
 }
 
-// A PNG entry is a whole file of its own; the names and pages of the icon stay.
+// A PNG entry is a complete file; file name and pages remain those of the icon.
 Status LoadPngEntry(std::span<const uint8_t> entry, const ReadOptions& options,
                     PictureRecord& picture, PackedImage* image, PackedImage* alpha) {
   const FixedText<64> typeName = picture.typeName;
@@ -266,7 +266,7 @@ Status LoadPngEntry(std::span<const uint8_t> entry, const ReadOptions& options,
   return Status::Ok;
 }
 
-// Facts, and with `image` the pixels, of the entry that the request's page selects.
+// Facts, and with `image` the pixels, of the entry selected by the request's page.
 Status LoadEntry(IcoFile& icons, const ReadRequest& request, PictureRecord& picture,
                  PackedImage* image, PackedImage* alpha) {
   const IcoEntry* entry = ChooseEntry(icons, request.page);
@@ -284,7 +284,7 @@ Status LoadEntry(IcoFile& icons, const ReadRequest& request, PictureRecord& pict
   return image == nullptr ? Status::Ok : ReadBitmap(bitmap, picture, *image, *alpha);
 }
 
-// What the writer stores: the bitmap's depth, with the sizes that its header and entry name.
+// File layout for a picture to write.
 struct IcoLayout {
   int32_t bits = 0;
   uint32_t colors = 0;
@@ -309,11 +309,11 @@ IcoLayout ChooseLayout(const PictureRecord& picture, bool cursor, int32_t compre
   return layout;
 }
 
-// An entry of the directory for a picture of `size` bytes at `offset`.
+// A directory entry for a picture of `size` bytes at `offset`.
 std::array<uint8_t, kEntrySize> MakeEntry(const PictureRecord& picture, const IcoLayout& layout,
                                           uint32_t size, uint32_t offset) {
   std::array<uint8_t, kEntrySize> entry = {};
-  entry[0] = static_cast<uint8_t>(picture.image.Width());  // 256 becomes 0, as it should
+  entry[0] = static_cast<uint8_t>(picture.image.Width());  // 256 becomes 0, as required
   entry[1] = static_cast<uint8_t>(picture.image.Height());
   entry[2] = static_cast<uint8_t>(layout.colors);
   const auto put = [&](size_t at, size_t bytes, uint32_t value) {
@@ -362,7 +362,7 @@ Status WriteColors(ByteWriter& out, const PictureRecord& picture, const IcoLayou
   return Status::Ok;
 }
 
-// Pixels of less than half opacity are transparent for programs that know the mask alone.
+// In the mask, pixels with less than half opacity are transparent.
 void WriteMask(ByteWriter& out, const PictureRecord& picture) {
   std::vector<uint8_t> mask(RowStride(picture.image.Width(), 1));
   for (int32_t r = 0; r < picture.image.Height(); ++r) {
@@ -420,7 +420,7 @@ class IcoSequence final : public SequenceWriter {
   }
 
  private:
-  const size_t count_;  // of pictures, as the file's head says
+  const size_t count_;  // pictures, as in the file header
   const WriteOptions options_;
   ByteWriter out_;
   bool cursor_ = false;

@@ -10,7 +10,7 @@ namespace {
 
 using namespace std::string_view_literals;
 
-// Either row reads both kinds of file.
+// Both rows read both kinds of file.
 constexpr std::string_view kIcon = "\0\0\1\0"sv, kCursor = "\0\0\2\0"sv;
 constexpr Signature kIconSignatures[] = {{0, kIcon, TrLater("an icon")}, {0, kCursor}};
 constexpr Signature kCursorSignatures[] = {{0, kCursor, TrLater("a cursor")}, {0, kIcon}};

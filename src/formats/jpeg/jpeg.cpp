@@ -1,22 +1,23 @@
 // JPEG (JFIF, Exif), big-endian, decoded and encoded by libjpeg.
 //
-//   FF D8, then segments of FF, a marker byte, a length (2 bytes, itself included) and data:
-//   E0 "JFIF" resolution      E1 "Exif\0\0" EXIF, "http://ns.adobe.com/xap/1.0/\0" XMP      E2
-//   "ICC_PROFILE\0" n of m EE "Adobe" color transform      FE comment      DB, C4 tables      C0-CF
-//   frame      DA scan and its data      D9 end
+//   FF D8, then segments of FF, a marker byte, a length (2 bytes, including itself) and data:
+//   E0 "JFIF" resolution    E1 "Exif\0\0" EXIF, "http://ns.adobe.com/xap/1.0/\0" XMP
+//   E2 "ICC_PROFILE\0" n of m    EE "Adobe" color transform    FE comment    DB, C4 tables
+//   C0-CF frame    DA scan and its data    D9 end
 //
-// Gray pictures become 8 bits with a gray palette, all others 24 bits. CMYK and YCCK are turned
-// into RGB by the usual formula, with the inverted values that Adobe's programs store. EXIF, XMP,
-// ICC profile, comment and resolution travel with the picture; its orientation is not applied here.
+// Gray pictures become 8 bits with a gray palette, all others 24 bits. CMYK and YCCK are converted
+// to RGB by the usual formula, with inverted values as stored by Adobe's programs. EXIF, XMP, ICC
+// profile, comment and resolution are kept; the orientation is not applied here.
 //
-// Broken data: a file that ends before its last pixel fails (status 3). A fault inside the data
-// that the decoder can pass over is noted in the record's `warning`, and the picture is shown with
-// it; a missing end marker is no fault.
+// Error handling: a file that ends before its last pixel fails (status 3). If the decoder recovers
+// from damaged data, the picture is shown and the record's `warning` set; a missing end marker is
+// not an error.
 //
-// The writer makes baseline or progressive files (WriteJpegProgressive) of quality JpegCompression
-// and chroma sampling JpegSubsample. Grays stay gray; other palettes are promoted. JpegStoreDPI
-// stores a resolution: the picture's, else TiffResolution. Source: ITU-T T.81 (1992) and T.871
-// (2011); Adobe Technical Note 5116; XMP specification part 3; ICC.1:2022, annex B.4.
+// The writer creates baseline or progressive files (WriteJpegProgressive) with quality
+// JpegCompression and chroma subsampling JpegSubsample. Grays stay gray; other palettes are
+// promoted. JpegStoreDPI stores a resolution: the picture's, else TiffResolution. Source: ITU-T
+// T.81 (1992) and T.871 (2011); Adobe Technical Note 5116; XMP specification part 3; ICC.1:2022,
+// annex B.4.
 #include "formats/jpeg/jpeg.h"
 
 #include <algorithm>
@@ -59,7 +60,7 @@ void Append(std::vector<uint8_t>& block, std::string_view data) {
     block.insert(block.end(), data.begin(), data.end());
 }
 
-// The profile's pieces may come in any order; each names its number from 1 and how many there are.
+// The profile's segments may come in any order; each has its number, from 1, and the total.
 void JoinProfile(const JpegReader& reader, std::vector<uint8_t>& profile) {
   std::array<std::string_view, 256> pieces = {};
   for (const JpegSegment& segment : reader.segments) {
@@ -114,8 +115,8 @@ Status DescribePicture(const JpegReader& reader, PictureRecord& picture) {
   return picture.width < 1 || picture.height < 1 ? Status::DamagedFile : Status::Ok;
 }
 
-// Sets what comes out: colors, and the smallest size in eighths whose longer edge is still twice
-// the side asked for.
+// Sets the output color space, and the smallest scale in eighths whose longer edge is at least
+// twice the requested side.
 void SetOutput(jpeg_decompress_struct& info, int32_t thumbnailSide) {
   info.out_color_space = IsGray(info) ? JCS_GRAYSCALE : IsCmyk(info) ? JCS_CMYK : JCS_EXT_BGR;
   info.scale_denom = 8;
@@ -128,8 +129,8 @@ void SetOutput(jpeg_decompress_struct& info, int32_t thumbnailSide) {
   jpeg_calc_output_dimensions(&info);
 }
 
-// Ink to light. 255 stands for no ink: so Adobe's programs store it, and files without their marker
-// are read like theirs.
+// CMYK to RGB. 255 means no ink: this is how Adobe's programs store it, and files without their
+// marker are treated the same.
 void CmykToBgr(const uint8_t* ink, uint8_t* color, size_t width) {
   for (size_t x = 0; x < width; ++x, ink += 4, color += 3) {
     for (size_t i = 0; i < 3; ++i) {
@@ -178,7 +179,7 @@ struct JpegWriter {
   ByteWriter out;
 };
 
-// The library fills the file's own buffer.
+// The library writes directly into the file's buffer.
 void OfferBuffer(j_compress_ptr info) {
   auto* out = static_cast<ByteWriter*>(info->client_data);
   info->dest->next_output_byte = out->Reserve(ByteWriter::kMostReserved);
@@ -234,7 +235,7 @@ void SetParameters(JpegWriter& writer, const PictureRecord& picture, bool gray,
   }
 }
 
-// One segment of a heading and data. False, without a trace, when there is too much for one.
+// Writes a segment with a header and data. False, without writing anything, if it is too large.
 bool WriteSegment(jpeg_compress_struct& info, int marker, std::string_view head,
                   std::span<const uint8_t> data) {
   if (data.empty()) return true;
@@ -260,7 +261,7 @@ bool WriteProfile(jpeg_compress_struct& info, std::span<const uint8_t> profile) 
   return true;
 }
 
-// `keep`: whether more goes along than the profile, which belongs to the colors.
+// `keep`: whether to write more than the profile, which belongs to the colors.
 void WriteMetadata(jpeg_compress_struct& info, PictureRecord& picture, bool keep) {
   const PictureMetadata& metadata = picture.metadata;
   if (keep && !WriteSegment(info, kApp1, kExifHead, metadata.exif))
@@ -270,7 +271,7 @@ void WriteMetadata(jpeg_compress_struct& info, PictureRecord& picture, bool keep
   if (keep) (void)WriteSegment(info, JPEG_COM, {}, picture.comment);
 }
 
-// A row as the encoder takes it: grays, or blue, green, red.
+// A row for the encoder: grays, or blue, green, red.
 void ExpandRow(const PictureRecord& picture, int32_t y, bool gray, std::vector<uint8_t>& target) {
   const auto row = picture.image.Row(y);
   const auto bits = static_cast<size_t>(picture.image.Bits());

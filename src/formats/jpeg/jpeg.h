@@ -10,23 +10,23 @@
 
 namespace fotomill {
 
-// JPEG. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when pixel data are cut
-// short, MemoryAllocationError (6), UnsupportedFormat (8) for the processes that are not decoded
-// (arithmetic, lossless, 12 bits). `thumbnailSide` of the request asks for a smaller decode.
+// JPEG. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) if pixel data are
+// truncated, MemoryAllocationError (6), UnsupportedFormat (8) for unsupported processes
+// (arithmetic, lossless, 12 bits). `thumbnailSide` of the request selects a reduced-size decode.
 Status JpegInfo(PictureRecord& picture, const ReadRequest& request);
 Status JpegRead(PictureRecord& picture, const ReadRequest& request);
 // Also ErrorCreatingFile (10), ErrorWritingFile (11).
 Status JpegWrite(PictureRecord& picture, const WriteOptions& options);
 Status JpegDetails(PictureRecord& picture);
 
-// A JPEG stream inside a file of another format.
+// A JPEG stream embedded in a file of another format.
 struct JpegStream {
   std::span<const uint8_t> data = {};
-  std::span<const uint8_t> tables = {};  // as ReadJpegHeader takes them
+  std::span<const uint8_t> tables = {};  // as for ReadJpegHeader
 };
-// As JpegInfo, JpegRead and JpegDetails. The first leaves the file's size alone; the last adds
-// lines to those that are there. `file` is where the stream comes from, still open. Statuses as
-// above but for FileOpenError.
+// As JpegInfo, JpegRead and JpegDetails. The first does not set the file size; the last
+// appends its lines. `file` is the file that contains the stream, still open. Statuses as
+// above, except FileOpenError.
 Status JpegStreamInfo(PictureRecord& picture, const JpegStream& stream);
 Status JpegStreamRead(PictureRecord& picture, const ReadRequest& request, const JpegStream& stream,
                       const platform::FileView& file);

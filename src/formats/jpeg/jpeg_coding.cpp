@@ -24,7 +24,7 @@ std::shared_ptr<const JpegCoding> CodingOf(const jpeg_decompress_struct& info) {
 
 namespace {
 
-// The library can read odd factors, such as 3 beside 2, but not write them.
+// The library can read fractional ratios, such as 3 next to 2, but not write them.
 bool CanSample(const JpegCoding& coding) {
   int32_t across = 1, down = 1;
   for (const JpegCoding::Component& component : coding.components) {
@@ -41,9 +41,9 @@ bool CanSample(const JpegCoding& coding) {
 void SetCoding(jpeg_compress_struct& info, const JpegCoding& coding) {
   const auto count = static_cast<size_t>(info.num_components);
   const bool sample = coding.count > 1 && count == coding.count && CanSample(coding);
-  int tables = 0;  // given so far
+  int tables = 0;  // defined so far
   for (size_t i = 0; i < count; ++i) {
-    // grays that got colors have one table for all
+    // a gray source has only one table
     const size_t place = std::min(i, coding.count - 1);
     const JpegCoding::Component& from = coding.components[place];
     jpeg_component_info& to = info.comp_info[i];

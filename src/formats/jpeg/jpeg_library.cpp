@@ -9,7 +9,7 @@ namespace fotomill {
 
 namespace {
 
-constexpr int kMostScans = 500;  // of a progressive file; more are an attack on time
+constexpr int kMostScans = 500;  // in a progressive file; more are a denial of service
 
 JpegErrors& ErrorsOf(j_common_ptr common) {
   return *static_cast<JpegErrors*>(static_cast<void*>(common->err));
@@ -20,8 +20,8 @@ JpegErrors& ErrorsOf(j_common_ptr common) {
   std::longjmp(ErrorsOf(common).jump, 1);
 }
 
-// How many rows of the picture the data have given so far; for one in several scans 1 stands for
-// all of them, coarse as they may be.
+// Number of rows decoded so far; for pictures with several scans, 1 stands for all
+// rows, however coarse.
 int64_t RowsOut(j_common_ptr common) {
   if (common->is_decompressor == FALSE) return 0;
   auto* info = static_cast<j_decompress_ptr>(static_cast<void*>(common));
@@ -30,9 +30,9 @@ int64_t RowsOut(j_common_ptr common) {
   return info->output_scanline;
 }
 
-// Message codes are not part of the library's public header; their texts are stable.
+// Message codes are not in the library's public header, but their texts are stable.
 void OnMessage(j_common_ptr common, int level) {
-  if (level >= 0) return;  // trace
+  if (level >= 0) return;  // trace message
   ++common->err->num_warnings;
   JpegErrors& errors = ErrorsOf(common);
   char text[JMSG_LENGTH_MAX];
@@ -52,7 +52,7 @@ void OnMessage(j_common_ptr common, int level) {
 
 void OutputNothing(j_common_ptr) {}
 
-// Called by the library for each row of blocks, of every scan.
+// Called by the library for each row of blocks in every scan.
 void Watch(j_common_ptr common) {
   const auto* info = static_cast<const jpeg_decompress_struct*>(static_cast<void*>(common));
   const auto* reader = static_cast<const JpegReader*>(info->client_data);
@@ -61,7 +61,7 @@ void Watch(j_common_ptr common) {
     common->err->error_exit(common);
 }
 
-// Whether it is one of Adobe's with captions and keywords. Source: Adobe, "Photoshop File Formats
+// Whether it is an Adobe segment with captions and keywords. Source: Adobe, "Photoshop File Formats
 // Specification", image resources; 1028 is IPTC.
 bool HoldsIptc(const JpegSegment& segment) {
   constexpr uint8_t kApp13 = JPEG_APP0 + 13;
@@ -70,16 +70,15 @@ bool HoldsIptc(const JpegSegment& segment) {
          TextOf(segment.data).find(kIptc) != std::string_view::npos;
 }
 
-// Whether a segment is one that travels with the picture, or that is missed where it does not.
+// Whether a segment is copied with the picture, or reported if it is not.
 bool IsKept(const JpegSegment& segment) {
   constexpr int kApp1 = JPEG_APP0 + 1, kApp2 = JPEG_APP0 + 2;
   return segment.marker == JPEG_COM || segment.marker == kApp2 || HoldsIptc(segment) ||
          (segment.marker == kApp1 && (segment.Starts(kExifHead) || segment.Starts(kXmpHead)));
 }
 
-// Walks to the first scan: keeps segments, the library's own way of which takes the square of their
-// number, and refuses what holds too little of a picture for its length, such as a hole of a
-// terabyte behind the first bytes.
+// Walks to the first scan: collects segments, for which the library itself takes quadratic time,
+// and rejects files with too much garbage, such as a hole of a terabyte after the first bytes.
 Status WalkHead(JpegReader& reader, std::span<const uint8_t> file) {
   JpegWalk walk(file, limits.garbageBytes);
   for (JpegPlace place; walk.Next(place) && place.end <= file.size();) {
@@ -87,7 +86,7 @@ Status WalkHead(JpegReader& reader, std::span<const uint8_t> file) {
     if (IsKept(segment) && reader.segments.size() < limits.jpegSegments)
       reader.segments.push_back(segment);
   }
-  // The library reports what is missing.
+  // The library reports truncation.
   return walk.Outcome() == Status::DamagedFile ? Status::DamagedFile : Status::Ok;
 }
 

@@ -3,7 +3,7 @@
 #include <csetjmp>
 #include <cstddef>
 #include <cstdint>
-#include <cstdio>  // the library's header wants it first
+#include <cstdio>  // required by the library's header
 
 #include <jpeglib.h>
 
@@ -16,25 +16,25 @@
 
 namespace fotomill {
 
-// How the JPEG codec talks to its library: an error jumps out of it, a warning is remembered.
+// Error handling for the library: errors longjmp out of it, warnings are recorded.
 struct JpegErrors {
-  jpeg_error_mgr base;  // first, so that the library's pointer leads to the whole
+  jpeg_error_mgr base;  // must be first, so that the library's pointer can be cast
   std::jmp_buf jump;
   bool cutShort = false;  // the data ended within a scan
-  int64_t wholeRows = 0;  // that were out before that; of pictures in several scans all
+  int64_t wholeRows = 0;  // rows decoded before that; all, for several scans
   bool endMissing = false;
-  char warning[JMSG_LENGTH_MAX] = {};  // the first one of damage, but for a missing end
-  char note[JMSG_LENGTH_MAX] = {};     // the first one of what is odd and harms no pixel
+  char warning[JMSG_LENGTH_MAX] = {};  // first one about damage, except for a missing end marker
+  char note[JMSG_LENGTH_MAX] = {};     // first one about irregularities that affect no pixels
   int code = 0;
-  bool stopped = false;  // by the one who asked for the picture
+  bool stopped = false;  // canceled by the caller
 
   void Set();
-  // What a failed library call means; `common` is what it was called for.
+  // The status for a failed library call; `common` is the object it was called for.
   Status Meaning(j_common_ptr common);
 };
 
-// Runs library calls; false when one of them failed. Nothing with a destructor may live inside
-// `action`.
+// Runs library calls; false if one of them failed. `action` must not contain
+// objects with destructors.
 template <typename Action>
 bool Guarded(JpegErrors& errors, Action action) {
   if (setjmp(errors.jump) != 0) return false;
@@ -42,7 +42,7 @@ bool Guarded(JpegErrors& errors, Action action) {
   return true;
 }
 
-// A decompressor of the library with its error handler.
+// A libjpeg decompressor with its error handler.
 struct JpegReader {
   JpegReader();
   ~JpegReader() { jpeg_destroy_decompress(&info); }
@@ -53,21 +53,21 @@ struct JpegReader {
 
   JpegErrors errors;
   jpeg_decompress_struct info = {};
-  // stops files with too many scans, and decodes that are no longer needed
+  // stops files with too many scans, and canceled decodes
   jpeg_progress_mgr monitor = {};
   StopToken stop = {};
-  std::vector<JpegSegment> segments;  // those kept, in the order of the file
+  std::vector<JpegSegment> segments;  // the collected ones, in file order
 };
 
-// Reads a file up to its first scan, keeping the segments of EXIF, XMP, profiles and comments.
-// `file` must stay until the reader is done. `tables` is an abbreviated stream, or empty: tables
-// that count where the file has none. Huffman tables that both lack are those of T.81, K.3.
+// Reads a file up to its first scan, collecting EXIF, XMP, profile and comment segments. `file`
+// must outlive the reader. `tables` is an abbreviated stream with default tables, or empty. Huffman
+// tables missing in both are those of T.81, K.3.
 Status ReadJpegHeader(JpegReader& reader, std::span<const uint8_t> file,
                       std::span<const uint8_t> tables = {});
 
-// Bytes of the arrays in which the library holds all coefficients of a picture: always for `all`,
-// else only where its scans come one after the other, whatever the size that it is decoded at.
-// Known once the header is read.
+// Size of the arrays in which the library stores all coefficients of a picture: always for `all`,
+// else only if there are several scans, regardless of the decoding scale. Available once the header
+// is read.
 uint64_t JpegCoefficientBytes(const JpegReader& reader, bool all);
 
 }  // namespace fotomill

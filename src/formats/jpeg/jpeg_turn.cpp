@@ -1,13 +1,13 @@
-// Lossless turning of JPEG pictures, a block of 8 x 8 coefficients at a time. With F(v, u) for the
-// vertical frequency v and the horizontal frequency u, a mirrored block is
+// Lossless rotation of JPEG pictures, in blocks of 8 x 8 coefficients. With F(v, u) for the
+// vertical frequency v and the horizontal frequency u, a transformed block is
 //
-//   left and right exchanged:  F(v, u) * (-1)^u
-//   top and bottom exchanged:  F(v, u) * (-1)^v
-//   rows become columns:       F(u, v); so do the quantization tables and the sampling factors
+//   mirrored horizontally:     F(v, u) * (-1)^u
+//   mirrored vertically:       F(v, u) * (-1)^v
+//   transposed:                F(u, v); likewise the quantization tables and the sampling factors
 //
-// since odd cosines change their sign about the block's middle and even ones do not. What is left
-// is to put the blocks in their new places. A rest of a block at the right or lower edge stays at
-// that edge; it cannot become the first one. Source: ITU-T T.81 (1992), annex A.3.3.
+// since odd cosines change sign when mirrored about the block's center and even ones do not. The
+// blocks are then moved to their new positions. A partial block at the right or bottom edge must
+// stay at that edge; it cannot become the first one. Source: ITU-T T.81 (1992), annex A.3.3.
 #include "formats/jpeg/jpeg_turn.h"
 
 #include <array>
@@ -24,7 +24,7 @@ namespace {
 
 constexpr int kCoefficients = DCTSIZE2;
 
-// A block's coefficients: where each comes from and its sign.
+// Source index and sign of each coefficient in a block.
 struct BlockTurn {
   explicit BlockTurn(Turn turn) {
     for (int i = 0; i < kCoefficients; ++i) {
@@ -45,9 +45,9 @@ struct BlockTurn {
 
 // The blocks of one component.
 struct Plane {
-  JDIMENSION fromWidth = 0, fromHeight = 0;  // in the old picture, as far as they are kept
-  JDIMENSION width = 0, height = 0;          // in the turned one
-  int across = 1, down = 1;                  // sampling factors of the turned one
+  JDIMENSION fromWidth = 0, fromHeight = 0;  // in the old picture, without trimmed edges
+  JDIMENSION width = 0, height = 0;          // in the rotated picture
+  int across = 1, down = 1;                  // sampling factors after rotation
   jvirt_barray_ptr from = nullptr, to = nullptr;
 };
 
@@ -64,18 +64,18 @@ struct JpegTurner {
   JpegTurner& operator=(const JpegTurner&) = delete;
 
   JpegReader reader;
-  JpegErrors errors;  // of writing
+  JpegErrors errors;  // of the writer
   jpeg_compress_struct info = {};
-  jpeg_progress_mgr monitor = {};  // of writing, which the reader's token stops too
+  jpeg_progress_mgr monitor = {};  // of the writer, also canceled by the reader's token
   unsigned char* bytes = nullptr;
   unsigned long size = 0;
-  JDIMENSION width = 0, height = 0;  // of the old picture, as far as it is kept
+  JDIMENSION width = 0, height = 0;  // of the old picture, without trimmed edges
   std::array<Plane, MAX_COMPONENTS> planes;
 };
 
 JDIMENSION RoundedUp(JDIMENSION a, JDIMENSION b) { return (a + b - 1) / b; }
 
-// Pixels of the smallest piece that every component has whole blocks for.
+// Width in pixels of the smallest unit with whole blocks of every component.
 JDIMENSION PieceWidth(const jpeg_decompress_struct& info) {
   return static_cast<JDIMENSION>(info.num_components == 1 ? 1 : info.max_h_samp_factor) * DCTSIZE;
 }
@@ -83,7 +83,7 @@ JDIMENSION PieceHeight(const jpeg_decompress_struct& info) {
   return static_cast<JDIMENSION>(info.num_components == 1 ? 1 : info.max_v_samp_factor) * DCTSIZE;
 }
 
-// Settles how much of the picture can be turned.
+// Determines how much of the picture can be rotated.
 void Measure(JpegTurner& turner, Turn turn, bool trim, TurnedJpeg& turned) {
   const jpeg_decompress_struct& old = turner.reader.info;
   const JDIMENSION pieceWidth = PieceWidth(old), pieceHeight = PieceHeight(old);
@@ -100,7 +100,7 @@ void Measure(JpegTurner& turner, Turn turn, bool trim, TurnedJpeg& turned) {
   turned.height = static_cast<int32_t>(turn.swap ? turner.width : turner.height);
 }
 
-// Where the blocks of each component are and will be.
+// Computes the old and new block positions of each component.
 void LayOut(JpegTurner& turner, Turn turn) {
   const jpeg_decompress_struct& old = turner.reader.info;
   for (int i = 0; i < old.num_components; ++i) {
@@ -123,7 +123,7 @@ void LayOut(JpegTurner& turner, Turn turn) {
   }
 }
 
-// Reads all coefficients; an obstacle where they are flawed, which a new file would hide.
+// Reads all coefficients; damaged ones are an obstacle, as a new file would hide the damage.
 Status ReadBlocks(JpegTurner& turner, std::span<const uint8_t> file, TurnedJpeg& turned) {
   JpegReader& reader = turner.reader;
   const bool read = Guarded(reader.errors, [&] {
@@ -145,7 +145,7 @@ void SetPictureForm(JpegTurner& turner, Turn turn) {
   jpeg_copy_critical_parameters(&old, &info);
   info.image_width = turn.swap ? turner.height : turner.width;
   info.image_height = turn.swap ? turner.width : turner.height;
-  // the old file's own segments are taken over
+  // the old file's segments are kept
   info.write_JFIF_header = info.write_Adobe_marker = FALSE;
   info.restart_interval = old.restart_interval;
   info.optimize_coding = TRUE;
@@ -164,7 +164,7 @@ void SetPictureForm(JpegTurner& turner, Turn turn) {
   }
 }
 
-// Zeroed, since the rows that fill up the last group of a component are read as well.
+// Zeroed, as the padding rows in the last group of a component are read as well.
 void RequestBlocks(JpegTurner& turner) {
   jpeg_compress_struct& info = turner.info;
   const auto common = static_cast<j_common_ptr>(static_cast<void*>(&info));
@@ -178,7 +178,7 @@ void RequestBlocks(JpegTurner& turner) {
   }
 }
 
-// Puts the turned blocks in their places, a row of new blocks after the other.
+// Moves the transformed blocks to their positions, one row of new blocks at a time.
 void TurnBlocks(JpegTurner& turner, const Plane& plane, Turn turn, const BlockTurn& block) {
   const auto old = static_cast<j_common_ptr>(static_cast<void*>(&turner.reader.info));
   const auto made = static_cast<j_common_ptr>(static_cast<void*>(&turner.info));
@@ -213,7 +213,7 @@ void WatchWriting(j_common_ptr common) {
 Status WriteTurned(JpegTurner& turner, Turn turn) {
   const BlockTurn block(turn);
   const bool written = Guarded(turner.errors, [&] {
-    // its blocks are asked for here, and fail into here
+    // the writer reads the reader's blocks, so errors go to the writer
     turner.reader.info.err = &turner.errors.base;
     jpeg_create_compress(&turner.info);
     turner.monitor.progress_monitor = WatchWriting;
@@ -247,7 +247,7 @@ Status TurnJpeg(std::span<const uint8_t> file, Orientation orientation, bool tri
   RETURN_IF_BAD(ReadJpegHeader(turner.reader, file));
   Measure(turner, turn, trim, turned);
   LayOut(turner, turn);
-  // the old and the new ones
+  // the old and the new coefficients
   const bool fits = CheckFileMemory(2 * JpegCoefficientBytes(turner.reader, true)) == Status::Ok;
   if (turned.obstacle.empty() && !fits) turned.obstacle = TrRecorded("The picture is too large.");
   if (!turned.obstacle.empty()) return Status::Ok;

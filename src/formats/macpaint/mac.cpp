@@ -1,30 +1,29 @@
 // MacPaint, big-endian: black and white, always 576 x 720 pixels.
 //
 //   offset size  field
-//        0  128  MacBinary header, there when its type field says so
+//        0  128  MacBinary header, optional, identified by its type field
 //        +0   1    version, 0
 //        +1   1    length of the name
 //        +2  63    file name
 //       +65   4    type, "PNTG"
 //       +69   4    creator, "MPNT"
-//       +83   4    length of everything behind this header
+//       +83   4    size of everything after this header
 //       +91   8    creation and modification, seconds each
 //        .  512  MacPaint header: version, four bytes, then fill patterns
-//        .       720 rows, the top one first, each packed on its own into 72 bytes; a set bit is
-//        black
+//        .       720 rows, top first, each packed separately into 72 bytes; a set bit is black
 //
-// A row is packed by PackBits: control byte n below 128, then n + 1 bytes as they are; or n above
-// 128, then one byte that is repeated 257 - n times. Every byte is inverted, since entry 1 of
-// the palette is white.
+// Rows are packed by PackBits: a control byte n below 128 precedes n + 1 literal bytes; one above
+// 128 precedes a byte that is repeated 257 - n times. Every byte is inverted, since entry 1 of the
+// palette is white.
 //
-// Reads files without a MacBinary header, and files of rows alone, known by a first byte that is
-// not zero. The name of a MacBinary header becomes the picture's type name. Control byte 128 is
-// skipped at the start of a row; behind a run it is an error, as is a run that passes the row's
-// end, although some programs wrote such files.
+// Also reads files without a MacBinary header, and files of rows only, identified by a nonzero
+// first byte. The name in a MacBinary header becomes the picture's type name. Control byte 128 is
+// skipped at the start of a row; after a run it is an error, as is a run beyond the row's end,
+// although some programs wrote such files.
 //
-// Writes rows as runs of two and more, a MacBinary header on request, and version 2 at the start of
-// each quarter of the MacPaint header. Dates count from 1904, four hours short: the constant is a
-// part of the format as this program writes it.
+// Writes runs of two and more, a MacBinary header on request, and version 2 at the start of each
+// quarter of the MacPaint header. Dates count from 1904, minus four hours: the constant is part of
+// the format as written by this program.
 //
 // Source: Apple Computer, Macintosh Technical Note 86, "MacPaint Document Format" (1985); Dennis F.
 // Brothers, "Macintosh Binary Transfer Format Standard Proposal" (1985).
@@ -57,7 +56,7 @@ constexpr uint64_t kTypeOffset = 65;
 constexpr uint64_t kLengthOffset = 83;
 constexpr std::string_view kType = "PNTG";
 constexpr std::string_view kCreatorType = "MPNT";
-constexpr int64_t kDateOffset = 2082830400;  // seconds added to those since 1970
+constexpr int64_t kDateOffset = 2082830400;  // added to seconds since 1970
 constexpr uint8_t kNoRun = 0x80;
 
 using MacRow = std::array<uint8_t, kRowBytes>;
@@ -80,14 +79,14 @@ struct MacHeader {
   uint64_t rowsOffset = 0;
 };
 
-// Where the rows begin.
+// Offset of the first row.
 uint64_t RowsOffset(std::span<const uint8_t> bytes) {
   if (HasMacBinaryHeader(bytes)) return kMacBinarySize + kMacPaintSize;
   return bytes[0] != 0 ? 0 : kMacPaintSize;
 }
 
-// Unpacks and inverts one row. Ok, or FileReadError when the data end inside the row or do not end
-// with it.
+// Unpacks and inverts one row. Ok, or FileReadError if the data end within the row or a run goes
+// beyond it.
 Status UnpackRow(ByteReader& bytes, std::span<uint8_t> row) {
   size_t filled = 0;
   while (filled < row.size()) {
@@ -106,9 +105,9 @@ Status UnpackRow(ByteReader& bytes, std::span<uint8_t> row) {
   return Status::Ok;
 }
 
-// Inverts and packs one row: equal neighbors as runs, everything else as it is.
+// Inverts and packs one row: equal bytes as runs, everything else as literals.
 void PackRow(ByteWriter& out, const MacRow& row) {
-  size_t literals = 0;  // bytes before `i` that no run has taken
+  size_t literals = 0;  // length of the literal run before `i`
   const auto flushLiterals = [&](size_t end) {
     if (literals > 0) out.U8(static_cast<uint8_t>(literals - 1));
     for (size_t i = end - literals; i < end; ++i) out.U8(static_cast<uint8_t>(~row[i]));
@@ -116,7 +115,7 @@ void PackRow(ByteWriter& out, const MacRow& row) {
   };
   size_t i = 0;
   while (i < row.size()) {
-    size_t more = 0;  // further bytes equal to the one at i
+    size_t more = 0;  // additional bytes equal to the one at i
     while (i + more + 1 < row.size() && row[i + more] == row[i + more + 1]) ++more;
     if (more == 0) {
       ++literals;
@@ -131,7 +130,7 @@ void PackRow(ByteWriter& out, const MacRow& row) {
   flushLiterals(row.size());
 }
 
-// Row y of the page on which the picture is: white beside and below it, cut at the page's edges.
+// Row y of the page with the picture: padded with white and clipped to the page.
 MacRow PageRow(const PackedImage& image, int32_t y) {
   MacRow page;
   page.fill(0xFF);
@@ -145,7 +144,7 @@ MacRow PageRow(const PackedImage& image, int32_t y) {
   return page;
 }
 
-// The name in a MacBinary header: that of the file, its first letter a capital, and who wrote it.
+// The name in a MacBinary header: the file's, with its first letter capitalized, and the creator.
 std::string HeaderName(std::string_view path) {
   std::string name = LowerCase(platform::FileNameOf(path));
   if (!name.empty()) name[0] = UpperCase(name[0]);
@@ -163,7 +162,7 @@ void WriteMacBinaryHeader(ByteWriter& out, std::string_view path) {
   out.Text(kType);
   out.Text(kCreatorType);
   out.Zeros(kLengthOffset - out.Position());
-  out.Be32(0);  // the length, once it is known
+  out.Be32(0);  // the size, patched later
   out.Zeros(4);
   out.Be32(date);
   out.Be32(date);
@@ -178,7 +177,7 @@ void WriteMacPaintHeader(ByteWriter& out) {
   }
 }
 
-// Fills the record's facts from the head of the file.
+// Fills in the record from the file header.
 Status DescribePicture(const platform::FileView& file, const ReadRequest&, MacHeader& header,
                        PictureRecord& picture) {
   if (file.Bytes().size() < kMacBinarySize) return Status::FileReadError;

@@ -3,21 +3,20 @@
 //   offset size  field
 //        0    4  "DanM": version 1, "LinS": version 2
 //        4    4  width, height
-//        8    8  pixel shape on the screen and the printer, written 1
+//        8    8  pixel aspect ratio of screen and printer, written as 1
 //       16    4  size of the printer's page, written as that of the picture
-//       20    4  nothing
-//       24    2  makes the exclusive or of the header's words 0
-//       26    6  nothing
-//       32       version 1: rows from the top, (width + 7) / 8 bytes each
-//       32       version 2: for each row the bytes of its code, 2 bytes each; then the codes
+//       20    4  unused
+//       24    2  checksum: the XOR of all header words is 0
+//       26    6  unused
+//       32       version 1: rows, top first, (width + 7) / 8 bytes each
+//       32       version 2: the packed size of each row, 2 bytes each; then the packed rows
 //
-// A set bit is white. A code is made of 0, count and value for a run, and of count and so many
-// bytes as they are. A row without any code is white.
+// A set bit is white. Packed data are runs, 0, count and value, and literals, count and that many
+// bytes. A row of packed size 0 is white.
 //
-// The reader does not look at the exclusive or, fills a row whose code ends early with white, and
-// drops what would go beyond it. The writer makes version 2 and stores the darker of two colors as
-// black. Source: J. Murray and W. vanRyper, "Encyclopedia of Graphics File Formats", 2nd edition
-// (1996).
+// The reader ignores the checksum, fills incomplete rows with white, and cuts those that are too
+// long. The writer creates version 2 and stores the darker of two colors as black. Source: J.
+// Murray and W. vanRyper, "Encyclopedia of Graphics File Formats", 2nd edition (1996).
 #include "formats/mspaint/msp.h"
 
 #include <algorithm>
@@ -37,7 +36,7 @@ constexpr uint64_t kHeaderSize = 32;
 constexpr std::string_view kPlain = "DanM", kCoded = "LinS";
 constexpr uint8_t kWhite = 0xff;
 constexpr size_t kMostInToken = 255;
-constexpr size_t kShortestRun = 4;  // a run costs three bytes
+constexpr size_t kShortestRun = 4;  // a run takes three bytes
 
 struct MspHeader {
   bool coded = false;
@@ -132,7 +131,7 @@ void PutBytes(std::span<const uint8_t> bytes, std::vector<uint8_t>& code) {
 void EncodeRow(std::span<const uint8_t> row, std::vector<uint8_t>& code) {
   code.clear();
   if (std::ranges::all_of(row, [](uint8_t byte) { return byte == kWhite; })) return;
-  size_t plain = 0;  // where the bytes that no run has taken begin
+  size_t plain = 0;  // start of the pending literal bytes
   for (size_t x = 0; x < row.size();) {
     size_t run = 1;
     while (x + run < row.size() && run < kMostInToken && row[x + run] == row[x]) ++run;
@@ -146,7 +145,7 @@ void EncodeRow(std::span<const uint8_t> row, std::vector<uint8_t>& code) {
   PutBytes(row.subspan(plain), code);
 }
 
-// UnsuitableImage when the code of a row is longer than its field can say.
+// UnsuitableImage if a packed row is too long for its size field.
 Status WriteRows(ByteWriter& out, const PictureRecord& picture) {
   const PackedImage& image = picture.image;
   const auto width = static_cast<size_t>(image.Width());

@@ -7,11 +7,11 @@
 namespace fotomill {
 
 // Microsoft Paint of Windows 1 and 2. Statuses: FileOpenError (1), DamagedFile (2), FileReadError
-// (3) when data are cut short, MemoryAllocationError (6).
+// (3) if truncated, MemoryAllocationError (6).
 Status MspInfo(PictureRecord& picture, const ReadRequest& request);
 Status MspRead(PictureRecord& picture, const ReadRequest& request);
-// Also TooManyColors (12) for pictures deeper than 1 bit, UnsuitableImage (13) for rows whose codes
-// take more than 65535 bytes, ErrorCreatingFile (10), ErrorWritingFile (11).
+// Also TooManyColors (12) for pictures deeper than 1 bit, UnsuitableImage (13) for packed rows of
+// more than 65535 bytes, ErrorCreatingFile (10), ErrorWritingFile (11).
 Status MspWrite(PictureRecord& picture, const WriteOptions& options);
 
 }  // namespace fotomill

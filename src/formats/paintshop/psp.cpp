@@ -1,13 +1,12 @@
-// Paint Shop Pro images (PSP). The file layout is described in psp_file.cpp.
+// Paint Shop Pro images (PSP). For the file layout see psp_file.cpp.
 //
-// The first page is the whole picture: the composite that later versions store, where it is
-// lossless, else the visible layers laid one on the other. Further pages are the layers, where
-// there are several, from the bottom up. Layers are blended as normal ones whatever their mode;
-// vectors, adjustments and masks are passed over, and the record's warning says so. Samples of 16
-// bits come down to 8.
+// The first page is the whole picture: the composite stored by later versions if it is lossless,
+// else the visible layers, composited. Further pages are the layers, if there are several, from the
+// bottom up. All layers are blended in normal mode; vectors, adjustments and masks are ignored, and
+// the record's warning says so. 16-bit samples are reduced to 8.
 //
-// The writer makes version 3, which Paint Shop Pro 5 and all later ones read: one layer, compressed
-// by deflate; up to 8 bits as 8 with a palette, everything else in three channels.
+// The writer creates version 3, which Paint Shop Pro 5 and later read: one layer, compressed by
+// deflate; up to 8 bits as 8 with a palette, everything else in three channels.
 #include "formats/paintshop/psp.h"
 
 #include <zlib.h>
@@ -27,7 +26,7 @@ namespace fotomill {
 
 namespace {
 
-// The layers that a page shows: one, or all that are visible.
+// The layers shown on a page: one, or all visible ones.
 std::span<const PspLayer> LayersOf(const PspFile& psp, int32_t page) {
   if (page > 0) return std::span(psp.layers).subspan(static_cast<size_t>(page) - 1, 1);
   return psp.composite.HasPixels() ? std::span(&psp.composite, 1) : std::span(psp.layers);
@@ -38,7 +37,7 @@ bool Covers(const PspLayer& layer, const PspFile& psp) {
          layer.visible && layer.Channel(PspBitmap::Transparency, PspColor::Composite) == nullptr;
 }
 
-// Whether a page is one opaque layer of indices.
+// Whether a page is a single opaque layer of palette indices.
 bool IsIndexed(const PspFile& psp, int32_t page) {
   const auto layers = LayersOf(psp, page);
   return layers.size() == 1 && Covers(layers[0], psp) &&
@@ -119,7 +118,7 @@ class LayerRows {
     for (uint8_t& value : alpha) value = static_cast<uint8_t>((value * opacity_ + 127) / 255);
   }
 
-  std::vector<uint8_t> bgr, alpha;  // of the row that was read
+  std::vector<uint8_t> bgr, alpha;  // of the current row
 
  private:
   size_t width_ = 0, count_ = 3;
@@ -130,7 +129,7 @@ class LayerRows {
   std::vector<uint8_t> samples_;
 };
 
-// Lays a pixel over what is there; `below` is null where everything is opaque.
+// Composites a pixel over the target; `below` is null if everything is opaque.
 void LayOver(const uint8_t* color, uint32_t opacity, uint8_t* target, uint8_t* below) {
   const uint32_t left = below == nullptr ? 255 - opacity : (*below * (255 - opacity) + 127) / 255,
                  sum = opacity + left;
@@ -256,19 +255,19 @@ void WriteLayerFacts(ByteWriter& out, const PackedImage& image) {
   };
   out.Text("Background");
   out.Zeros(256 - 10);
-  out.U8(0);  // plain pixels
+  out.U8(0);  // raster layer
   writeRectangle(true);
   writeRectangle(true);
   // opacity, blend mode, visible, not protected, no group
   for (const int fact : {255, 0, 1, 0, 0}) out.U8(static_cast<uint8_t>(fact));
   writeRectangle(false);  // no mask
   writeRectangle(false);
-  out.Zeros(3 + 2 + 40);  // nor ranges to be blended
+  out.Zeros(3 + 2 + 40);  // nor blend ranges
   out.Le16(1);            // bitmaps
   out.Le16(image.Bits() <= 8 ? 1 : 3);
 }
 
-// Hands rows of one channel to deflate. False when that fails.
+// Compresses the rows of one channel. False on failure.
 class ChannelWriter {
  public:
   explicit ChannelWriter(ByteWriter& out) : out_(out) {
@@ -297,7 +296,7 @@ class ChannelWriter {
   bool ready_ = false;
 };
 
-// The row of one channel: 0 red, 1 green, 2 blue, or all indices.
+// The row of a channel: 0 red, 1 green, 2 blue, or all indices.
 void GatherRow(const PackedImage& image, size_t channel, int32_t y, std::span<uint8_t> row) {
   const auto source = image.Row(y);
   if (image.Bits() == 24) {
@@ -331,7 +330,7 @@ Status WriteChannel(ByteWriter& out, const PictureRecord& picture, size_t channe
   }
   const uint64_t size = out.Position() - begin;
   if (out.Position() > UINT32_MAX) return Status::UnsuitableImage;
-  if (out.Failed()) return Status::Ok;  // told at the end
+  if (out.Failed()) return Status::Ok;  // reported at the end
   out.PatchLe32(place + 10, static_cast<uint32_t>(kChannelPart + size));
   out.PatchLe32(place + kBlockHead, static_cast<uint32_t>(size));
   return Status::Ok;

@@ -2,31 +2,31 @@
 //
 //   offset size  field
 //        0   32  "Paint Shop Pro Image File\n", 1A, zeros
-//       32    4  version: major, minor; 3 is that of Paint Shop Pro 5, 4 of 6, 5 of 7, 6 of 8
-//       36       blocks: "~BK", 0, number (2), in version 3 the bytes of the first part (4), bytes
-//       of the whole (4), data; later
-//                versions have the bytes of a part, itself included (4), at the beginning of each
-//                part
+//       32    4  version: major, minor; 3 is Paint Shop Pro 5, 4 is 6, 5 is 7, 6 is 8
+//       36       blocks: "~BK", 0, number (2), in version 3 the size of the first part (4), total
+//                size (4), data; later versions have the size of a part, including itself (4), at
+//                the start of each part
 //
-//   0 image: width, height (4 each), resolution (8), its metric (1: 1 inches, 2 centimeters),
-//   compression (2: 0 none, 1 run
-//     lengths, 2 deflate, 3 JPEG), bits of a pixel (2), planes (2), colors (4), gray (1), ...
+//   0 image: width, height (4 each), resolution (8), its unit (1: 1 inches, 2 centimeters),
+//     compression (2: 0 none, 1 run-length, 2 deflate, 3 JPEG), bits per pixel (2), planes (2),
+//     colors (4), gray (1), ...
 //   2 palette: entries (4), then blue, green, red, 0 each
 //   3 layers: a block 4 for each, from the bottom up
 //   4 layer: name (version 3: 256 bytes, later: length (2) and text), kind (1), rectangle of the
-//   image and of the saved part
-//     (left, top, right, bottom, 4 each), opacity, blend mode, visible (1 each), ..., bitmaps,
-//     channels (2 each; later in a part of their own), then a block 5 for each channel
-//   5 channel: compressed and plain bytes (4 each), bitmap (2: 0 image, 1 transparency), color (2:
-//   0 all in one, 1 red, 2
-//     green, 3 blue), data
+//   image
+//     and of the saved part (left, top, right, bottom, 4 each), opacity, blend mode, visible (1
+//     each), ..., bitmaps, channels (2 each; later in a separate part), then a block 5 for each
+//     channel
+//   5 channel: compressed and uncompressed size (4 each), bitmap (2: 0 image, 1 transparency),
+//   color
+//     (2: 0 all in one, 1 red, 2 green, 3 blue), data
 //   16 composites: blocks 17 with width, height (4 each), bits, compression, planes (2 each),
-//   colors (4), kind (2: 0 the
-//     whole picture, 1 a thumbnail), then in that order blocks 9 with bitmaps, channels (2 each)
-//     and blocks 5, or blocks 18 of JPEG
+//   colors
+//     (4), kind (2: 0 the whole picture, 1 a thumbnail), then in that order blocks 9 with bitmaps,
+//     channels (2 each) and blocks 5, or blocks 18 of JPEG
 //
-// A run-length token is a count and that many literal bytes, or from 129 on one byte that is
-// repeated count - 128 times. Source: Jasc Software, "Paint Shop Pro (PSP) File Format
+// A run-length token is a count and that many literal bytes, or a count above 128 and one byte that
+// is repeated count - 128 times. Source: Jasc Software, "Paint Shop Pro (PSP) File Format
 // Specification", versions 3.0 to 6.0 (1998 to 2003).
 #include "formats/paintshop/psp_file.h"
 
@@ -61,7 +61,7 @@ struct BlockView {
   std::span<const uint8_t> data;
 };
 
-// The next block; what is missing of the last one is left out. False at the end.
+// The next block, cut at the end of the file. False at the end.
 bool NextBlock(ByteReader& bytes, uint16_t version, BlockView& block) {
   if (!bytes.Match(std::string_view("~BK\0", 4))) return false;
   block.number = bytes.Le16();
@@ -73,7 +73,7 @@ bool NextBlock(ByteReader& bytes, uint16_t version, BlockView& block) {
   return true;
 }
 
-// A reader of a block's first part, behind its size.
+// A reader for a block's first part, after its size.
 ByteReader FirstPart(const BlockView& block, uint16_t version) {
   ByteReader bytes(block.data);
   if (version >= 4) bytes.Skip(4);
@@ -107,7 +107,7 @@ void TakeColors(ByteReader bytes, PspFile& psp) {
   psp.hasPalette = bytes.Ok() && count > 0;
 }
 
-// The channels that blocks hold.
+// Collects the channels stored in blocks.
 void TakeChannels(std::span<const uint8_t> data, uint16_t version, PspLayer& layer) {
   ByteReader bytes(data);
   BlockView block;
@@ -169,7 +169,7 @@ void TakeLayers(std::span<const uint8_t> data, PspFile& psp) {
   }
 }
 
-// Takes the composite that shows the whole picture, when its pixels are lossless.
+// Uses the composite of the whole picture, if it is lossless.
 void TakeComposites(const BlockView& bank, PspFile& psp) {
   ByteReader bytes(BehindFirstPart(bank));
   BlockView block;

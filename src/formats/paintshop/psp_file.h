@@ -10,7 +10,7 @@
 
 namespace fotomill {
 
-// What a Paint Shop Pro image holds, as views into the file. See psp_file.cpp for the layout.
+// The contents of a Paint Shop Pro image, as views into the file. For the layout see psp_file.cpp.
 
 enum class PspCompression : uint16_t { None = 0, RunLengths = 1, Lz77 = 2, Jpeg = 3 };
 enum class PspBitmap : uint16_t { Image = 0, Transparency = 1 };
@@ -19,13 +19,13 @@ enum class PspColor : uint16_t { Composite = 0, Red = 1, Green = 2, Blue = 3 };
 struct PspChannel {
   PspBitmap bitmap = PspBitmap::Image;
   PspColor color = PspColor::Composite;
-  uint32_t size = 0;  // bytes of all rows, not compressed
+  uint32_t size = 0;  // uncompressed size of all rows
   std::span<const uint8_t> data;
 };
 
-// A layer, or the composite of all.
+// A layer, or the composite image.
 struct PspLayer {
-  Rectangle place;  // on the canvas, which it may leave
+  Rectangle place;  // on the canvas, may extend beyond it
   uint8_t opacity = 255;
   uint8_t blendMode = 0;  // 0 normal
   bool visible = true;
@@ -33,23 +33,23 @@ struct PspLayer {
   PspCompression compression = PspCompression::None;
   std::vector<PspChannel> channels;
 
-  // Null when there is none of that kind.
+  // Null if there is no such channel.
   const PspChannel* Channel(PspBitmap bitmap, PspColor color) const;
-  // Whether there are pixels: a composite channel, or the three colors.
+  // Whether there are pixels: a composite channel, or the three color channels.
   bool HasPixels() const;
 };
 
 struct PspFile {
-  uint16_t version = 0;  // 3 is that of Paint Shop Pro 5
+  uint16_t version = 0;  // 3 is Paint Shop Pro 5
   int32_t width = 0, height = 0;
-  double dpi = 0;  // 0 when the file does not say
+  double dpi = 0;  // 0 if unknown
   PspCompression compression = PspCompression::None;
   int32_t bits = 24;
   bool gray = false, hasPalette = false;
   Palette palette{};
-  std::vector<PspLayer> layers;  // those with pixels, from the bottom up
+  std::vector<PspLayer> layers;  // raster layers, from the bottom up
   int32_t otherLayers = 0;       // vectors, adjustments
-  PspLayer composite;            // without channels when there is none
+  PspLayer composite;            // without channels if there is none
 };
 
 // FileReadError, DamagedFile.

@@ -12,9 +12,9 @@ namespace fotomill {
 
 namespace {
 
-constexpr uint64_t kBestDeflate = 1040, kBestRuns = 64;  // how much smaller data can get
+constexpr uint64_t kBestDeflate = 1040, kBestRuns = 64;  // maximum compression ratios
 
-// False when the data end early.
+// False if the data are truncated.
 bool UnpackRuns(std::span<const uint8_t> data, std::span<uint8_t> rows) {
   ByteReader bytes(data);
   size_t filled = 0;

@@ -10,14 +10,14 @@
 
 namespace fotomill {
 
-// The rows of a channel, whole in memory.
+// The decoded rows of a channel.
 class PspPlane {
  public:
-  // FileReadError when the data cannot hold the rows, DamagedFile, MemoryAllocationError,
+  // FileReadError if the data are too short for the rows, DamagedFile, MemoryAllocationError,
   // UnsupportedFormat for JPEG.
   Status Open(const PspLayer& layer, const PspChannel& channel);
 
-  // A row as samples of 8 bits; indices of fewer bits and samples of 16 are made that.
+  // A row as 8-bit samples, converted from narrower indices and 16-bit samples.
   void Row(int32_t y, std::span<uint8_t> samples) const;
 
  private:
@@ -26,7 +26,7 @@ class PspPlane {
   platform::MemoryBlock unpacked_;
   std::span<const uint8_t> rows_;
   size_t rowSize_ = 0;
-  int32_t bits_ = 8;  // of a sample
+  int32_t bits_ = 8;  // per sample
 };
 
 }  // namespace fotomill

@@ -2,26 +2,27 @@
 //
 //   offset size  field
 //        0    1  manufacturer, always 10
-//        1    1  version; 3: the fixed sixteen colors; from 5 on an 8-bit file may end in a
-//        palette; written 5 2    1  encoding, written 1; not read: data are always run-length coded
+//        1    1  version; 3: the fixed 16 colors; from 5 on, 8-bit files may end in a palette;
+//                written as 5
+//        2    1  encoding, written as 1; ignored: data are always run-length coded
 //        3    1  bits per pixel and plane
-//        4    8  xmin, ymin, xmax, ymax, the corners; written 0, 0, width - 1, height - 1
-//       12    4  two resolutions, written 300
-//       16   48  palette of sixteen colors
+//        4    8  xmin, ymin, xmax, ymax; written as 0, 0, width - 1, height - 1
+//       12    4  two resolutions, written as 300
+//       16   48  palette of 16 colors
 //       64    1  reserved
 //       65    1  planes
-//       66    2  bytes per line and plane, used as stored; written without rounding up
-//       68    2  palette information, written 1, or 0 with 24 bits
+//       66    2  bytes per line and plane, used as stored; written without padding
+//       68    2  palette information, written as 1, or 0 with 24 bits
 //       70   58  filler
-//      128       lines from the top, each with its planes one after the other
+//      128       lines, top first, each with its planes one after the other
 //   end - 769    12 and a palette of 256 colors, with 8 bits
 //
-// Palettes are red, green, blue. A byte of 0xC0 or more counts in its low six bits how often the
-// byte after it comes; any other byte is a literal.
+// Palettes are red, green, blue. A byte of 0xC0 or more has the repeat count of the next byte in
+// its low six bits; any other byte is a literal.
 //
-// The reader carries runs on from line to line, and takes two bits in one plane (CGA) beside the
-// combinations that it writes. The writer codes every plane of every line on its own, and leaves
-// the last byte of a run to the token after it. Source: ZSoft Corporation, "PCX Technical Reference
+// The reader continues runs across lines, and in addition to the combinations it writes supports
+// two bits in one plane (CGA). The writer encodes every plane of every line separately, and leaves
+// the last byte of a run to the next token. Source: ZSoft Corporation, "PCX Technical Reference
 // Manual" (1991).
 #include "formats/pcx/pcx.h"
 
@@ -49,7 +50,7 @@ constexpr size_t kHeaderPaletteSize = 48;
 constexpr uint8_t kTrailerMark = 12;
 constexpr uint64_t kTrailerSize = 1 + 768;
 
-// The palette of version 3 files, which hold none.
+// The palette of version 3 files, which do not store one.
 constexpr std::array<uint8_t, kHeaderPaletteSize> kFixedColors = {
     0x00, 0x00, 0x00, 0x00, 0x00, 0xAA, 0x00, 0xAA, 0x00, 0x00, 0xAA, 0xAA, 0xAA, 0x00, 0x00, 0xAA,
     0x00, 0xAA, 0xAA, 0x55, 0x00, 0xAA, 0xAA, 0xAA, 0x55, 0x55, 0x55, 0x55, 0x55, 0xFF, 0x55, 0xFF,
@@ -59,15 +60,15 @@ struct PcxHeader {
   uint8_t version = 0;
   uint8_t bitsPerPlane = 0;
   uint8_t planes = 0;
-  int32_t width = 0, height = 0;  // 1 to 65536 when valid
-  uint16_t bytesPerLine = 0;      // of one plane
+  int32_t width = 0, height = 0;  // 1 to 65536 if valid
+  uint16_t bytesPerLine = 0;      // per plane
   std::array<uint8_t, kHeaderPaletteSize> palette{};
 
   size_t LineSize() const { return size_t{bytesPerLine} * planes; }
 };
 
-// Turns a decoded line of `header.LineSize()` bytes into a whole row of the picture, padding
-// included. Pixels that the line does not hold become 0.
+// Converts a decoded line of `header.LineSize()` bytes to a row of the picture, including padding.
+// Pixels missing in the line become 0.
 using SpreadRow = void (*)(std::span<const uint8_t> line, const PcxHeader& header,
                            std::span<uint8_t> row);
 
@@ -77,7 +78,7 @@ void CopyRow(std::span<const uint8_t> line, const PcxHeader&, std::span<uint8_t>
   std::memset(row.data() + count, 0, row.size() - count);
 }
 
-// One bit of each of 2 to 4 planes makes a 4-bit pixel, the first plane its lowest bit.
+// Combines 2 to 4 bit planes to 4-bit pixels, the first plane being the lowest bit.
 void SpreadBitPlanes(std::span<const uint8_t> line, const PcxHeader& header,
                      std::span<uint8_t> row) {
   const size_t count = static_cast<size_t>(std::min(header.width, header.bytesPerLine * 8));
@@ -85,7 +86,7 @@ void SpreadBitPlanes(std::span<const uint8_t> line, const PcxHeader& header,
   MergeBitPlanes(line.data(), count, header.planes, header.bytesPerLine, row.data());
 }
 
-// Four 2-bit pixels of a byte become four 4-bit ones.
+// Converts 2-bit pixels to 4-bit pixels.
 void SpreadPairs(std::span<const uint8_t> line, const PcxHeader& header, std::span<uint8_t> row) {
   std::memset(row.data(), 0, row.size());
   const int32_t width = std::min(header.width, header.bytesPerLine * 4);
@@ -95,7 +96,7 @@ void SpreadPairs(std::span<const uint8_t> line, const PcxHeader& header, std::sp
   }
 }
 
-// A red, a green and a blue plane become pixels of blue, green, red.
+// Combines red, green and blue planes to pixels of blue, green, red.
 void MergeColorPlanes(std::span<const uint8_t> line, const PcxHeader& header,
                       std::span<uint8_t> row) {
   const size_t count = std::min<size_t>(header.width, header.bytesPerLine);
@@ -106,7 +107,7 @@ void MergeColorPlanes(std::span<const uint8_t> line, const PcxHeader& header,
   std::memset(row.data() + 3 * count, 0, row.size() - 3 * count);
 }
 
-// The arrangements of planes that can be read, and what they are read as.
+// The supported plane arrangements, and the resulting depth.
 struct Arrangement {
   uint8_t bitsPerPlane;
   uint8_t planes;
@@ -127,7 +128,7 @@ constexpr Arrangement kArrangements[] = {
 };
 // clang-format on
 
-// Null for a combination that is not in the table.
+// Null for unsupported combinations.
 const Arrangement* FindArrangement(const PcxHeader& header) {
   for (const Arrangement& row : kArrangements) {
     if (row.bitsPerPlane == header.bitsPerPlane && row.planes == header.planes) return &row;
@@ -135,7 +136,7 @@ const Arrangement* FindArrangement(const PcxHeader& header) {
   return nullptr;
 }
 
-// Ok, or DamagedFile when the header is short, of another format, or leaves nothing to decode.
+// Ok, or DamagedFile if the header is truncated, of another format, or describes no valid picture.
 Status ParseHeader(std::span<const uint8_t> file, PcxHeader& header) {
   ByteReader bytes(file);
   const uint8_t manufacturer = bytes.U8();
@@ -158,8 +159,8 @@ Status ParseHeader(std::span<const uint8_t> file, PcxHeader& header) {
   return valid ? Status::Ok : Status::DamagedFile;
 }
 
-// Fills `palette` with what the header's version and depth call for. FileReadError when a palette
-// at the end is there but cannot be read.
+// Sets `palette` according to version and depth in the header. FileReadError if a palette at the
+// end exists but cannot be read.
 Status ReadPalette(const platform::FileView& file, const PcxPlace& place, const PcxHeader& header,
                    int32_t depth, Palette& palette) {
   MakeDefaultPalette(&palette, nullptr, depth == 24 ? kDisplayPalette : kBlackAndWhitePalette);
@@ -177,7 +178,7 @@ Status ReadPalette(const platform::FileView& file, const PcxPlace& place, const 
   return Status::Ok;
 }
 
-// Parses the header and fills the record's facts.
+// Parses the header and fills in the record.
 Status DescribePicture(const platform::FileView& file, const PcxPlace& place,
                        PictureRecord& picture, PcxHeader& header) {
   picture.typeName.Clear();
@@ -196,15 +197,15 @@ Status DescribePicture(const platform::FileView& file, const PcxPlace& place,
   return ReadPalette(file, place, header, picture.bitsPerPixel, picture.palette);
 }
 
-// What the writer stores for a picture.
+// File layout for a picture to write.
 struct PcxLayout {
   int32_t depth = 0;  // 1, 2, 3, 4, 8 or 24
   uint8_t bitsPerPlane = 0;
   uint8_t planes = 0;
-  uint16_t bytesPerLine = 0;  // of one plane
+  uint16_t bytesPerLine = 0;  // per plane
 };
 
-// UnsuitableImage when a line does not fit its field.
+// UnsuitableImage if a line does not fit its field.
 Status ChooseLayout(const PictureRecord& picture, PcxLayout& layout) {
   const PackedImage& image = picture.image;
   const bool planar = image.Bits() == 4 && picture.bitsPerPixel >= 2 && picture.bitsPerPixel <= 4;
@@ -237,7 +238,7 @@ void WriteHeader(ByteWriter& out, const PcxLayout& layout, const PictureRecord& 
   out.Zeros(kHeaderSize - 70);
 }
 
-// Takes the planes of a row apart, `bytesPerLine` bytes each, one after the other.
+// Splits a row into planes of `bytesPerLine` bytes each, one after the other.
 using TakePlanes = void (*)(std::span<const uint8_t> row, int32_t width, const PcxLayout& layout,
                             std::span<uint8_t> planes);
 

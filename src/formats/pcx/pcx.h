@@ -6,20 +6,20 @@
 
 namespace fotomill {
 
-// PC Paintbrush. The file layout, and what is peculiar to this codec, is described in pcx.cpp.
+// PC Paintbrush. For the file layout and this codec's quirks see pcx.cpp.
 
-// Fills the facts of `picture`: size, depth, palette. Ok, FileOpenError; DamagedFile for a short
-// header, another signature, an unknown arrangement of planes, or a size that leaves nothing to
-// decode; FileReadError when a palette at the end cannot be read.
+// Sets size, depth and palette of `picture`. Ok, FileOpenError; DamagedFile for a truncated header,
+// a wrong signature, an unknown plane arrangement, or an invalid size; FileReadError if a palette
+// at the end cannot be read.
 Status PcxInfo(PictureRecord& picture, const ReadRequest& request);
 
-// Fills the facts and decodes the pixels into `image`. Statuses of PcxInfo; FileReadError when the
-// data end early; MemoryAllocationError.
+// Calls PcxInfo and decodes the pixels into `image`. Statuses of PcxInfo; FileReadError if the data
+// are truncated; MemoryAllocationError.
 Status PcxRead(PictureRecord& picture, const ReadRequest& request);
 
 // Writes `image` to picture.fileName as a version 5 file; pictures of 2 to 4 bits in as many
-// planes. Ok; MemoryAllocationError when there is no image; UnsuitableImage for 65536 columns of
-// more than 4 bits; ErrorCreatingFile, ErrorWritingFile.
+// planes. Ok; MemoryAllocationError if there is no image; UnsuitableImage for 65536 columns of more
+// than 4 bits; ErrorCreatingFile, ErrorWritingFile.
 Status PcxWrite(PictureRecord& picture, const WriteOptions& options);
 
 }  // namespace fotomill

@@ -9,20 +9,20 @@
 
 namespace fotomill {
 
-// Where a PCX picture is in a file: all of it, or a page among others. Within the file, `begin`
-// not behind `end`.
+// The position of a PCX picture in a file: all of it, or one of several pages. Must be within the
+// file, with `begin` <= `end`.
 struct PcxPlace {
   uint64_t begin = 0, end = 0;
   uint64_t Size() const { return end - begin; }  // bytes
 };
 
-// The work of the operations of pcx.h on a part of a file, with their statuses. DescribePcx needs
-// no more of the file to be visible than its first byte. ReadPcx leaves `image` alone unless it
-// succeeds.
+// As the operations of pcx.h, for a part of a file, with the same
+// statuses. DescribePcx only needs the first byte of the file to
+// be visible. ReadPcx leaves `image` unchanged on failure.
 Status DescribePcx(const platform::FileView& file, const PcxPlace& place, PictureRecord& picture);
 Status ReadPcx(platform::FileView& file, const PcxPlace& place, const ReadRequest& request,
                PictureRecord& picture);
-// Writes the picture at the writer's position; the commit is the caller's.
+// Writes the picture at the writer's position, without a commit.
 Status WritePcx(ByteWriter& out, const PictureRecord& picture);
 
 }  // namespace fotomill

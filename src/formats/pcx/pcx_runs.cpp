@@ -12,22 +12,21 @@ namespace fotomill {
 namespace {
 
 constexpr uint8_t kMark = 0xC0;
-constexpr uint8_t kSingle = kMark + 1;  // the mark before a single byte
+constexpr uint8_t kSingle = kMark + 1;  // the mark for a single byte
 constexpr size_t kLongestRun = 63;
 #ifdef BYTE_SHUFFLE
-constexpr int kManyMarks = 10;  // among 64 bytes, so that taking them out at once pays
+constexpr int kManyMarks = 10;  // per 64 bytes, from which removing them in bulk is faster
 #endif
 
-// Both directions walk over their data with this state. The fast walks stop where too little is
-// left for them, and give back how far they came; by value, so that the state stays in registers
-// while bytes are stored.
+// State of encoder and decoder. The fast loops stop near the end of the data and return their
+// state, by value so that it is kept in registers despite byte stores.
 struct Walk {
   const uint8_t* from;
   const uint8_t* fromEnd;
   uint8_t* to;
 };
 
-// Writes the tokens for `count` equal bytes.
+// Writes tokens for `count` equal bytes.
 inline uint8_t* PutRun(uint8_t* to, size_t count, uint8_t value) {
   for (; count > kLongestRun; count -= kLongestRun) {
     *to++ = static_cast<uint8_t>(kMark + kLongestRun);
@@ -53,7 +52,7 @@ BYTE_SHUFFLE void Store8(uint8_t* bytes, __m128i value) {
   _mm_storel_epi64(reinterpret_cast<__m128i*>(bytes), value);
 }
 
-// One bit for each of sixteen bytes: whether it is a mark, or equals another.
+// A bit mask of the bytes, of sixteen, that are marks or equal to another.
 BYTE_SHUFFLE uint32_t Marks(__m128i bytes) {
   const __m128i mark = _mm_set1_epi8(static_cast<char>(kMark));
   return static_cast<uint32_t>(_mm_movemask_epi8(_mm_cmpeq_epi8(_mm_max_epu8(bytes, mark), bytes)));
@@ -64,8 +63,8 @@ BYTE_SHUFFLE uint32_t Equal(__m128i a, __m128i b) {
 
 using ShuffleTable = std::array<std::array<uint8_t, 16>, 256>;
 
-// For each set of flagged bytes among eight: every byte, with the ninth byte of the register before
-// each flagged one.
+// Shuffles for each 8-bit mask: all eight bytes, with byte 9 of the register inserted before each
+// flagged one.
 constexpr ShuffleTable MakeInsertions() {
   ShuffleTable table{};
   for (size_t flags = 0; flags < table.size(); ++flags) {
@@ -78,7 +77,7 @@ constexpr ShuffleTable MakeInsertions() {
   return table;
 }
 
-// For each set of flagged bytes among eight: the other bytes.
+// Shuffles for each 8-bit mask: the unflagged bytes.
 constexpr ShuffleTable MakeRemovals() {
   ShuffleTable table{};
   for (size_t flags = 0; flags < table.size(); ++flags) {
@@ -98,8 +97,8 @@ BYTE_SHUFFLE __m128i Shuffle(__m128i bytes, const ShuffleTable& table, uint32_t 
                           _mm_load_si128(reinterpret_cast<const __m128i*>(table[flags].data())));
 }
 
-// Writes the first `count` of eight bytes, a single mark before each flagged one. Sixteen bytes of
-// `to` may change.
+// Writes the first `count` of eight bytes, inserting a single mark before each flagged one. May
+// overwrite sixteen bytes of `to`.
 BYTE_SHUFFLE uint8_t* PutSingles(uint8_t* to, const uint8_t* bytes, uint32_t count,
                                  uint32_t flags) {
   const __m128i marked =
@@ -108,7 +107,7 @@ BYTE_SHUFFLE uint8_t* PutSingles(uint8_t* to, const uint8_t* bytes, uint32_t cou
   return to + count + static_cast<uint32_t>(std::popcount(flags & ((1u << count) - 1)));
 }
 
-// How many bytes from `from` on equal the one after them.
+// Number of bytes from `from` on that equal their successor.
 BYTE_SHUFFLE size_t CountEqual(const uint8_t* from, const uint8_t* end) {
   const __m128i value = _mm_set1_epi8(static_cast<char>(*from));
   const uint8_t* next = from + 1;
@@ -121,9 +120,8 @@ BYTE_SHUFFLE size_t CountEqual(const uint8_t* from, const uint8_t* end) {
   return static_cast<size_t>(next - from) - 1;
 }
 
-// Sixteen bytes at a time. A byte that equals the next is coded like a single byte with a mark,
-// unless the next one equals its neighbour as well: only three equal bytes make a run that needs
-// counting.
+// Sixteen bytes at a time. A byte equal to the next is coded like a single byte with a mark, unless
+// the next one equals its neighbor as well: only runs of at least three bytes need counting.
 BYTE_SHUFFLE Walk EncodeFast(Walk walk) {
   while (walk.fromEnd - walk.from >= 18) {
     const __m128i bytes = Load(walk.from);
@@ -150,9 +148,9 @@ BYTE_SHUFFLE Walk EncodeFast(Walk walk) {
   return walk;
 }
 
-// Which of 64 bytes are marks, given those of 0xC0 or more: of such bytes in a row every other one,
-// beginning with the first, since a mark makes a plain byte of the one after it. Subtracting runs a
-// carry through each row.
+// Which of 64 bytes are marks, given a mask of those >= 0xC0: in each sequence of such bytes every
+// other one, starting with the first, since the byte after a mark is data. The subtraction
+// propagates a carry through each sequence.
 constexpr uint64_t MarksAmong(uint64_t candidates) {
   constexpr uint64_t kOdd = 0xAAAAAAAAAAAAAAAA;
   return (((candidates << 1 | kOdd) - candidates) ^ kOdd) & candidates;
@@ -160,7 +158,7 @@ constexpr uint64_t MarksAmong(uint64_t candidates) {
 static_assert(MarksAmong(0b0'1111'0'111'0'11'0'1) == 0b0'0101'0'101'0'01'0'1);
 static_assert(MarksAmong(0b0'1111'0'111'0'11'0'1'0) == 0b0'0101'0'101'0'01'0'1'0);
 
-// Copies, or fills with one byte, `count` bytes of at most 64. All 64 may change.
+// Copies or fills `count` bytes, at most 64. May overwrite all 64.
 BYTE_SHUFFLE void CopyShort(uint8_t* to, const uint8_t* from, size_t count) {
   Store(to, Load(from));
   Store(to + 16, Load(from + 16));
@@ -172,8 +170,8 @@ BYTE_SHUFFLE void FillShort(uint8_t* to, uint8_t value, size_t count) {
   for (size_t i = 16; i < count; i += 16) Store(to + i, bytes);
 }
 
-// Decodes the tokens that begin in the 64 bytes at walk.from, given where their marks are, one by
-// one, and moves past them. False at a token that reaches beyond the line.
+// Decodes the tokens that start in the 64 bytes at walk.from, one by one, given the positions of
+// their marks, and advances past them. False at a token that goes beyond the line.
 BYTE_SHUFFLE bool DecodeTokens(Walk& walk, uint64_t marks, const uint8_t* lineEnd) {
   const uint8_t* const block = walk.from;
   const uint8_t* const blockEnd = block + 64;
@@ -195,7 +193,7 @@ BYTE_SHUFFLE bool DecodeTokens(Walk& walk, uint64_t marks, const uint8_t* lineEn
   return true;
 }
 
-// Whether all marks of 64 bytes are those of single bytes.
+// Whether all marks in 64 bytes are single marks.
 BYTE_SHUFFLE bool AllSingle(const uint8_t* bytes, uint64_t marks) {
   const __m128i single = _mm_set1_epi8(static_cast<char>(kSingle));
   uint64_t singles = 0;
@@ -204,8 +202,8 @@ BYTE_SHUFFLE bool AllSingle(const uint8_t* bytes, uint64_t marks) {
   return (marks & ~singles) == 0;
 }
 
-// Decodes 64 bytes all of whose marks are those of single bytes: they are left out, eight bytes at
-// a time. The line has room for what comes of them. A mark at the end stays for the next time.
+// Decodes 64 bytes with single marks only, by removing the marks, eight bytes at a time. The line
+// must have enough room for the result. A mark at the end is left for the next call.
 BYTE_SHUFFLE void DecodeSingles(Walk& walk, uint64_t marks) {
   for (unsigned i = 0; i < 64; i += 8) {
     const uint32_t flags = static_cast<uint32_t>(marks >> i & 0xFF);
@@ -215,11 +213,11 @@ BYTE_SHUFFLE void DecodeSingles(Walk& walk, uint64_t marks) {
   walk.from += 64 - (marks >> 63);
 }
 
-// Decodes 64 bytes at a time into a line, as far as its end or the end of the data is not near. Up
-// to 64 bytes behind the line may change.
+// Decodes a line 64 bytes at a time until near the end of the line or the data. May overwrite up to
+// 64 bytes after the line.
 BYTE_SHUFFLE Walk DecodeFast(Walk walk, const uint8_t* lineEnd) {
   while (walk.fromEnd - walk.from >= 128) {
-    if (*walk.from > kSingle) {  // a run here is mostly one of many
+    if (*walk.from > kSingle) {  // a run here is likely followed by more runs
       const size_t count = *walk.from & kLongestRun;
       if (count > static_cast<size_t>(lineEnd - walk.to)) return walk;
       FillShort(walk.to, walk.from[1], 64);

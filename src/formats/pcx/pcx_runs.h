@@ -6,35 +6,35 @@
 
 namespace fotomill {
 
-// The run-length code of PCX lines. A byte of 0xC0 or more, a mark, counts in its low six bits how
-// often the byte after it comes; any other byte stands for itself.
+// Run-length coding of PCX lines. A byte of 0xC0 or more, a mark, has the repeat count of the next
+// byte in its low six bits; any other byte is a literal.
 
-// Decodes lines one after the other; runs go on from line to line. The data stay with their owner.
+// Decodes line by line; runs may continue across lines. Does not own the data.
 class PcxLineDecoder {
  public:
-  // Bytes behind a line that Decode may overwrite, so that it can copy in larger pieces.
+  // Decode may overwrite this many bytes after a line, in order to copy in larger blocks.
   static constexpr size_t kSlack = 64;
 
   // Does not own the data.
   explicit PcxLineDecoder(std::span<const uint8_t> data)
       : next_(data.data()), end_(data.data() + data.size()) {}
 
-  // Decodes the next `size` bytes into `line`, which has room for kSlack more. False when the data
-  // end before.
+  // Decodes the next `size` bytes into `line`, which must have room for kSlack more. False if the
+  // data are truncated.
   [[nodiscard]] bool Decode(uint8_t* line, size_t size);
-  // The first byte that is not decoded yet.
+  // The next undecoded byte.
   const uint8_t* Next() const { return next_; }
 
  private:
   const uint8_t* next_;
   const uint8_t* end_;
-  size_t pending_ = 0;  // what the line before left of its last run
-  uint8_t value_ = 0;   // of that run
+  size_t pending_ = 0;  // remaining count of the run at the end of the previous line
+  uint8_t value_ = 0;   // value of that run
 };
 
-// Codes one plane of a line and returns the number of bytes written to `out`, at most twice the
-// plane's. Of a run of equal bytes the last is left to the token after it: m equal bytes cost a
-// pair for m - 1 of them and one token more.
+// Encodes one plane of a line and returns the number of bytes written to `out`, at most twice the
+// plane's size. The last byte of a run is left to the next token: m equal bytes take a pair for m -
+// 1 of them plus one token.
 size_t EncodePcxPlane(std::span<const uint8_t> plane, uint8_t* out);
 
 }  // namespace fotomill

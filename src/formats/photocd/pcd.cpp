@@ -1,10 +1,10 @@
-// Photo CD pictures (PCD). The file layout is described in pcd_file.cpp.
+// Photo CD pictures (PCD). For the file layout see pcd_file.cpp.
 //
-// One file holds one picture in up to five sizes. The first three are stored plainly, the larger
-// ones as what they differ by from the size before, doubled. Which size is taken is up to
-// PhotoCDResolution, and to the thumbnail asked for. A picture that was taken upright is turned.
-// The pictures of an overview are pages. A size of 6144 x 4096, which is in files of its own, is
-// not read.
+// A file contains one picture in up to five resolutions. The first three are stored directly, the
+// larger ones as differences from the next smaller one, doubled. The resolution is selected by
+// PhotoCDResolution, and by the requested thumbnail size. Pictures in portrait orientation are
+// rotated. The pictures of an overview file are pages. The resolution 6144 x 4096, in separate
+// files, is not supported.
 #include "formats/photocd/pcd.h"
 
 #include <algorithm>
@@ -28,14 +28,14 @@ constexpr const char* kSizeNames[kPcdSizes] = {"Photo CD, Base/16", "Photo CD, B
                                                "Photo CD, Base", "Photo CD, 4Base",
                                                "Photo CD, 16Base"};
 
-// The size that the request's options ask for.
+// The resolution selected by the request's options.
 int32_t SizeFor(const PcdFile& pcd, const ReadRequest& request) {
   return pcd.overview
              ? 0
              : std::min(pcd.largest, std::clamp(request.options.photoCdSize, 0, kPcdSizes - 1));
 }
 
-// A smaller one that is enough for the thumbnail.
+// A smaller one that suffices for the thumbnail.
 int32_t SizeForThumbnail(int32_t size, int32_t side) {
   if (side <= 0) return size;
   int32_t smaller = 0;
@@ -68,7 +68,7 @@ Status OpenPicture(platform::FileView& file, const ReadRequest& request, PcdFile
   return Status::Ok;
 }
 
-// Tells the rows of a picture, which are gone through several times.
+// Reports progress in rows, over several passes.
 class Steps {
  public:
   Steps(const PictureRecord& picture, int32_t passes) : picture_(picture), passes_(passes) {}
@@ -85,7 +85,7 @@ class Steps {
   const int32_t passes_;
 };
 
-// Makes the planes of the next size out of the ones that are there.
+// Creates the planes of the next resolution from the current ones.
 Status AddSize(std::span<const uint8_t> file, uint64_t tables, bool lumaOnly, Steps& steps,
                PcdPlanes& planes, bool& damaged) {
   planes.luma = DoublePcdPlane(planes.luma);
@@ -101,7 +101,7 @@ Status AddSize(std::span<const uint8_t> file, uint64_t tables, bool lumaOnly, St
   return status;
 }
 
-// The planes of a size: luma, and chromas of half its width and height.
+// The planes of a resolution: luma, and chroma of half the width and height.
 Status ReadPlanes(std::span<const uint8_t> file, const PcdFile& pcd, int32_t size, int32_t picture,
                   Steps& steps, PcdPlanes& planes, bool& damaged) {
   const int32_t plain = std::min(size, kPcdPlainSizes - 1);
@@ -118,13 +118,13 @@ Status ReadPlanes(std::span<const uint8_t> file, const PcdFile& pcd, int32_t siz
   return AddSize(file, pcd.tables16, false, steps, planes, damaged);
 }
 
-// Puts rows `y` and the following of a picture into an image that is turned to the left.
+// Writes rows `y` and following of a picture to an image rotated to the left.
 class TurnedRows {
  public:
   static constexpr int32_t kBand = 16;
 
   TurnedRows(int32_t turns, PackedImage& image) : turns_(turns), image_(image) {}
-  // `bgr` holds `count` rows, at most kBand, of `width` pixels.
+  // `bgr` has `count` rows, at most kBand, of `width` pixels.
   void Put(const uint8_t* bgr, int32_t y, int32_t count, int32_t width) {
     if (turns_ % 2 == 1) {
       for (int32_t x = 0; x < width; ++x) PutColumn(bgr, y, count, width, x);
@@ -178,7 +178,7 @@ Status ConvertPlanes(const PcdPlanes& planes, int32_t turns, const Steps& steps,
   return Status::Ok;
 }
 
-// Text of a field of fixed length, padded with blanks, zeros or bytes of FF.
+// Text in a field of fixed length, padded with blanks, zeros or FF bytes.
 std::string Field(std::span<const uint8_t> file, uint64_t offset, uint64_t length) {
   ByteReader bytes(file);
   bytes.Seek(kPcdHeader + offset);

@@ -5,9 +5,9 @@
 
 namespace fotomill {
 
-// Photo CD pictures. The size is the largest of the file that the request's options allow.
-// Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when data are cut short,
-// MemoryAllocationError (6), NoImages (20) for an overview without that picture.
+// Photo CD pictures. Uses the largest resolution allowed by the request's options. Statuses:
+// FileOpenError (1), DamagedFile (2), FileReadError (3) if truncated, MemoryAllocationError (6),
+// NoImages (20) if an overview does not have the picture.
 Status PcdInfo(PictureRecord& picture, const ReadRequest& request);
 Status PcdRead(PictureRecord& picture, const ReadRequest& request);
 Status PcdDetails(PictureRecord& picture);

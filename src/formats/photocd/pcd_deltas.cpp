@@ -1,17 +1,18 @@
-// The deltas of a Photo CD picture, big-endian: what the larger sizes differ by from the next
+// The deltas of a Photo CD picture, big-endian: differences between a resolution and the next
 // smaller one, doubled by PcdDoubleRow.
 //
-// A table of code words: how many there are, less one (1 byte), then for each
+// A code table has the number of codes minus one (1 byte), then for each code
 //   offset size  field
-//        0    1  its length in bits, less one; at most 15
-//        1    2  its bits, from the highest down
-//        3    1  the delta that it stands for, signed
+//        0    1  its length in bits minus one; at most 15
+//        1    2  its bits, most significant first
+//        3    1  the delta it represents, signed
 //
-// A row of deltas begins with FF FF FE, anywhere among the bits, which no words give. Then come
+// A row of deltas starts with the mark FF FF FE, at any bit position, which cannot occur within
+// codes. It is followed by
 //     2 bits  plane: 0 luma, 2 and 3 chroma
-//    13 bits  row; that of a chroma counts twice. The number behind the last row ends the picture.
-//     1 bit   nothing
-// and one word for each sample of the row. Rows may come in any order.
+//    13 bits  row; doubled for chroma. The number after the last row ends the picture.
+//     1 bit   unused
+// and one code for each sample of the row. Rows may come in any order.
 // Source: H. Danisch, hpcdtoppm (1992).
 #include "formats/photocd/pcd_deltas.h"
 
@@ -27,12 +28,12 @@ namespace {
 constexpr uint64_t kMark = 0xFFFFFE;
 constexpr int kMarkBits = 24, kLongestWord = 16;
 
-// Bits from the highest down; behind the last byte come zeros.
+// A bit reader, most significant bit first; zero-padded after the last byte.
 class Bits {
  public:
   explicit Bits(std::span<const uint8_t> data) : data_(data) {}
 
-  // At least 48 bits, the next one on top.
+  // At least 48 bits, left-aligned.
   uint64_t Peek() {
     if (held_ < 48) Fill();
     return bits_;
@@ -41,14 +42,14 @@ class Bits {
     bits_ <<= count;
     held_ -= count;
   }
-  // Whether more was read than there is.
+  // Whether bits past the end were read.
   bool PastEnd() const { return at_ == data_.size() && held_ < padding_; }
 
-  // Moves to the next mark; false when there is none.
+  // Moves to the next mark; false if there is none.
   bool FindMark() {
     while (Peek() >> (64 - kMarkBits) != kMark) {
       if (PastEnd()) return false;
-      // a mark begins with ones
+      // a mark starts with ones
       const int zeros = std::countl_zero(bits_);
       Skip(std::clamp(zeros, 1, kMarkBits));
     }
@@ -71,10 +72,10 @@ class Bits {
   size_t at_ = 0;
   uint64_t bits_ = 0;
   int held_ = 0;
-  int padding_ = 0;  // of the bits held, those behind the last byte
+  int padding_ = 0;  // number of padding bits in the buffer
 };
 
-// False when a word is none of the code's.
+// False for an invalid code.
 bool AddRow(Bits& bits, const PcdCode& code, uint8_t* row, int32_t width) {
   for (int32_t x = 0; x < width; ++x) {
     const PcdCode::Word word = code.Find(bits.Peek());
@@ -85,7 +86,7 @@ bool AddRow(Bits& bits, const PcdCode& code, uint8_t* row, int32_t width) {
   return true;
 }
 
-// The most bytes that the deltas of one size take.
+// Maximum data size for the deltas of one resolution.
 uint64_t MostBytes(const PcdPlanes& planes) {
   const uint64_t samples = planes.luma.samples.size() + planes.chroma[0].samples.size() +
                            planes.chroma[1].samples.size();
@@ -112,7 +113,7 @@ bool PcdCode::Parse(std::span<const uint8_t> bytes, uint64_t& position) {
   position = reader.Position();
   if (!reader.Ok() || count < 2) return false;
   std::ranges::sort(words, {}, &LongWord::bits);
-  uint32_t end = 0;  // no word may begin with another one
+  uint32_t end = 0;  // prefix check: no code may be the start of another
   for (const LongWord& entry : words) {
     if (entry.bits < end) return false;
     end = entry.bits + (1u << (kLongestWord - entry.word.length));

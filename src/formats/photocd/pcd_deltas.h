@@ -11,18 +11,18 @@
 
 namespace fotomill {
 
-// The prefix code of one plane's deltas.
+// The prefix code for one plane's deltas.
 class PcdCode {
  public:
   struct Word {
-    uint8_t length = 0;  // bits; 0: there is no such word
+    uint8_t length = 0;  // bits; 0: not a valid code
     int8_t delta = 0;
   };
 
-  // Takes the table that begins at `position`, and moves there to its end. False for one that is no
-  // code.
+  // Parses the table at `position`, and advances
+  // past it. False if it is not a valid code.
   [[nodiscard]] bool Parse(std::span<const uint8_t> bytes, uint64_t& position);
-  // The word that the highest bits of `bits` begin with.
+  // The code at the highest bits of `bits`.
   Word Find(uint64_t bits) const {
     const Word word = fast_[bits >> (64 - kFastBits)];
     return word.length != 0 ? word : FindLong(bits);
@@ -31,7 +31,7 @@ class PcdCode {
  private:
   static constexpr int kFastBits = 11;
   struct LongWord {
-    uint16_t bits = 0;  // from the highest down
+    uint16_t bits = 0;  // most significant first
     Word word;
   };
   Word FindLong(uint64_t bits) const;
@@ -42,14 +42,14 @@ class PcdCode {
 
 struct PcdCodes {
   std::array<PcdCode, 3> planes;
-  // The tables of `count` planes, one after the other.
+  // The tables of `count` planes, in sequence.
   [[nodiscard]] bool Parse(std::span<const uint8_t> sector, int32_t count);
 };
 
-// Adds deltas to the planes of one size. With `lumaOnly` there are none for the chromas. `onRow` is
-// told how many rows of luma are done, and its status ends the work. FileReadError when the data
-// end before the last row, DamagedFile when there are none. `damaged` tells that rows were left as
-// they are.
+// Adds deltas to the planes of one resolution. With `lumaOnly` there are none for chroma. `onRow`
+// receives the number of luma rows done, and its status may stop the operation. FileReadError if
+// the data end before the last row, DamagedFile if there are none. `damaged` is set if rows were
+// left without deltas.
 Status AddPcdDeltas(std::span<const uint8_t> data, const PcdCodes& codes, bool lumaOnly,
                     PcdPlanes& planes, const std::function<Status(int32_t)>& onRow, bool& damaged);
 

@@ -1,35 +1,35 @@
 // The layout of Photo CD files (PCD), big-endian, in sectors of 2048 bytes.
 //
 //   sector  content
-//        0  nothing; in an overview: "PCD_OPA", and at byte 10 the number of pictures (2 bytes)
-//        1  "PCD_IPI", then the facts of the image:
+//        0  empty; in an overview: "PCD_OPA", and at byte 10 the number of pictures (2 bytes)
+//        1  "PCD_IPI", then image information:
 //             offset size  field
 //                  7    2  version of the specification
-//                 13    4  time of scanning, seconds since 1970
+//                 13    4  scan time, seconds since 1970
 //                 21    1  medium
 //                 22   20  product
-//                 42   20  maker of the scanner
+//                 42   20  scanner manufacturer
 //                 62   16  scanner
 //                 90   20  its serial number
-//                112   20  maker of the workstation
+//                112   20  workstation manufacturer
 //                165   60  photo finisher
-//               1538    1  bits 0-1: quarter turns to the left, 2-3: sizes beyond 768 x 512
-//               1539    2  the sector where 3072 x 2048 begins
-//        4  192 x 128   for each two rows: both of luma, one of each chroma, half as wide
+//               1538    1  bits 0-1: 90-degree rotations to the left, 2-3: sizes beyond 768 x 512
+//               1539    2  first sector of 3072 x 2048
+//        4  192 x 128   for every two rows: both of luma, one of each chroma, half as wide
 //       23  384 x 256   the same
 //       96  768 x 512   the same
-//      387  at byte 510: how many sectors behind 384 the last of 1536 x 1024 is (2 bytes)
-//      388  1536 x 1024: the code of the luma's deltas
-//      389  its deltas, up to a whole sector
-//        n  3072 x 2048, begins with a sector of FF bytes
-//     n+12  the codes of the deltas of luma and of both chromas
+//      387  at byte 510: last sector of 1536 x 1024, relative to 384 (2 bytes)
+//      388  1536 x 1024: code table of the luma deltas
+//      389  its deltas, padded to a sector
+//        n  3072 x 2048, starts with a sector of FF bytes
+//     n+12  code tables of the deltas for luma and both chroma planes
 //     n+14  the deltas
 //
-// An overview has pictures of 192 x 128 one after the other from sector 5 on. How deltas are coded
-// is described in pcd_deltas.cpp.
+// An overview has pictures of 192 x 128, one after the other from sector 5 on. For the coding of
+// deltas see pcd_deltas.cpp.
 //
-// The maker published nothing, and what is known comes from those who looked at files. So what a
-// header says about its sizes is not relied on: a size is there when its data are.
+// The format was never published, and what is known comes from reverse engineering. Therefore the
+// sizes in the header are not relied on: a resolution exists if its data are present.
 // Sources: H. Danisch, hpcdtoppm (1992); Murray and vanRyper, Encyclopedia of Graphics File Formats
 // (1996), on Photo CD; the Photo CD tags of ExifTool's documentation; PRONOM fmt/211.
 #include "formats/photocd/pcd_file.h"
@@ -46,9 +46,9 @@ namespace {
 constexpr uint64_t kPlainSectors[kPcdPlainSizes] = {4, 23, 96};
 constexpr uint64_t kOverviewSector = 5, kOverviewStep = 18;
 constexpr uint64_t kTables4 = 388, kData4 = 389;
-constexpr uint64_t kTables16 = 12;        // sectors behind the beginning of the size
-constexpr uint64_t kNear = 16;            // sectors that a pointer may miss its place by
-constexpr uint64_t kMostSectors4 = 2048;  // that the deltas of 1536 x 1024 may take
+constexpr uint64_t kTables16 = 12;        // sectors after the start of the resolution
+constexpr uint64_t kNear = 16;            // sectors by which a pointer may be off
+constexpr uint64_t kMostSectors4 = 2048;  // for the deltas of 1536 x 1024
 
 std::span<const uint8_t> Sector(std::span<const uint8_t> file, uint64_t number) {
   ByteReader bytes(file);
@@ -56,7 +56,7 @@ std::span<const uint8_t> Sector(std::span<const uint8_t> file, uint64_t number) 
   return bytes.Peek(kPcdSector);
 }
 
-// Whether the code tables of `planes` planes are in a sector.
+// Whether a sector has the code tables of `planes` planes.
 bool HasTables(std::span<const uint8_t> sector, int32_t planes) {
   PcdCodes codes;
   return codes.Parse(sector, planes);
@@ -68,7 +68,7 @@ bool Begins16(std::span<const uint8_t> file, uint64_t number) {
          HasTables(Sector(file, number + kTables16), 3);
 }
 
-// The first of `count` sectors from `from` on at which the largest size begins; 0 when none does.
+// The first of `count` sectors from `from` on where the largest resolution starts; 0 if none does.
 uint64_t Find16(std::span<const uint8_t> file, uint64_t from, uint64_t count) {
   for (uint64_t number = std::max(from, kData4); count > 0; ++number, --count) {
     if (Begins16(file, number)) return number;
@@ -76,7 +76,7 @@ uint64_t Find16(std::span<const uint8_t> file, uint64_t from, uint64_t count) {
   return 0;
 }
 
-// Both places that tell where the largest size begins may be empty.
+// Both fields for the start of the largest resolution may be empty.
 uint64_t Locate16(std::span<const uint8_t> file) {
   ByteReader bytes(file);
   bytes.Seek(kPcdHeader + 1539);

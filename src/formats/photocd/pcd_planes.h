@@ -7,7 +7,7 @@
 
 namespace fotomill {
 
-// Samples of one kind, row after row.
+// Samples of one component, row by row.
 struct PcdPlane {
   int32_t width = 0, height = 0;
   std::vector<uint8_t> samples;
@@ -25,23 +25,23 @@ struct PcdPlane {
   }
 };
 
-// Luma and two chromas of half its size, or of a quarter.
+// Luma, and two chroma planes of a half or a quarter of its size.
 struct PcdPlanes {
   PcdPlane luma;
   std::array<PcdPlane, 2> chroma;
 };
 
-// Takes the samples of a picture of width x height that are stored plainly, in the order told in
-// pcd_file.cpp. `data` holds them all.
+// Reads directly stored samples of a picture of width x height, in the order described in
+// pcd_file.cpp. `data` must contain all of them.
 void ReadPlainPlanes(std::span<const uint8_t> data, int32_t width, int32_t height,
                      PcdPlanes& planes);
 
-// A row of twice the samples: those of `row` and `next`, the one below it, mixed half and half, and
-// means between them. With the same row twice, it is that row doubled.
+// A row of twice the width: the average of `row` and `next`, the one below it, with interpolated
+// samples in between. If both are the same row, it is only doubled horizontally.
 void DoublePcdRow(const uint8_t* row, const uint8_t* next, int32_t width, uint8_t* doubled);
 // Row `y` of a plane of twice the width and height.
 void DoubledPcdRow(const PcdPlane& plane, int32_t y, uint8_t* doubled);
-// The plane in twice the width and height.
+// The plane at twice the width and height.
 PcdPlane DoublePcdPlane(const PcdPlane& plane);
 
 }  // namespace fotomill

@@ -1,14 +1,14 @@
-// Photoshop documents (PSD, PDD): their pictures. The file layout is described in psd_file.cpp.
+// Photoshop documents (PSD, PDD): their pictures. For the file layout see psd_file.cpp.
 //
-// The reader shows the merged picture. Where the program stored none, each layer that holds pixels
-// is a page, from the bottom up, in its place on the canvas. Bitmap, gray, indexed, RGB, CMYK, Lab;
-// duotone as the gray that it is made of; multichannel as gray, or as the inks cyan, magenta,
-// yellow and black where it has so many. Samples of 16 bits come down to 8. Inks become sRGB by the
+// The reader shows the merged picture. If there is none, each layer with pixels is a page, from the
+// bottom up, at its position on the canvas. Supported are bitmap, gray, indexed, RGB, CMYK, Lab;
+// duotone as its gray channel; multichannel as gray, or with enough channels as cyan, magenta,
+// yellow and black inks. 16-bit samples are reduced to 8. Inks are converted to sRGB by the
 // embedded profile, else by the usual formula.
 //
-// The channel behind those of the mode is alpha, unless the file has layers and says that the
-// merged picture is opaque, or calls it a spot color. Where it is the opacity of the merged
-// picture, whose colors then lie on white, they are taken off it.
+// The channel after those of the mode is alpha, unless the file has layers and says that the merged
+// picture is opaque, or marks it as a spot color. If it is the opacity of the merged picture, whose
+// colors are then composited onto white, the white is removed from them.
 #include "formats/photoshop/psd.h"
 
 #include <algorithm>
@@ -45,7 +45,7 @@ bool ShowsLayers(const PsdFile& document) {
   return !document.layers.empty() && (document.merged.empty() || !document.mergedIsReal);
 }
 
-// Whether the merged picture's channel behind those of the mode is alpha.
+// Whether the channel after those of the mode is alpha in the merged picture.
 bool MergedHasAlpha(const PsdFile& document) {
   if (document.header.mode == PsdMode::Bitmap || document.header.mode == PsdMode::Multichannel)
     return false;
@@ -78,13 +78,13 @@ void CopyBlock(std::span<const uint8_t> block, std::vector<uint8_t>& into) {
   if (block.size() <= limits.metadataBytes) into.assign(block.begin(), block.end());
 }
 
-// Pixels that an ink or Lab picture becomes are sRGB: its profile stays behind.
+// Ink and Lab pictures are converted to sRGB, so their profile is dropped.
 bool KeepsProfile(const PsdHeader& header) {
   return header.mode == PsdMode::Gray || header.mode == PsdMode::Indexed ||
          header.mode == PsdMode::Rgb;
 }
 
-// Ok, or NoImages when there is nothing to show.
+// Ok, or NoImages if there is nothing to show.
 Status DescribePicture(const PsdFile& document, PictureRecord& picture) {
   const PsdHeader& header = document.header;
   picture.typeName.AssignCut(std::string("Photoshop, ") + ModeName(header));
@@ -113,7 +113,7 @@ Status DescribePicture(const PsdFile& document, PictureRecord& picture) {
   return document.merged.empty() && document.layers.empty() ? Status::NoImages : Status::Ok;
 }
 
-// Makes rows of the picture out of rows of its channels.
+// Converts rows of channels to rows of the picture.
 class RowMaker {
  public:
   RowMaker(const PsdFile& document, size_t width)
@@ -127,7 +127,7 @@ class RowMaker {
     if (ink_ != nullptr) mixed_.resize(channels_ * width);
   }
 
-  // `planes` are those of the colors.
+  // `planes` are the color planes.
   Status Next(std::span<PsdPlane* const> planes, std::span<uint8_t> row) {
     if (channels_ == 1) return planes[0]->Next(row);
     for (size_t c = 0; c < channels_; ++c) RETURN_IF_BAD(planes[c]->Next(Samples(c)));
@@ -150,12 +150,12 @@ class RowMaker {
 
   const size_t width_;
   const size_t channels_;
-  std::vector<uint8_t> samples_;  // a row of each channel
-  std::vector<uint8_t> mixed_;    // pixel by pixel
+  std::vector<uint8_t> samples_;  // one row of each channel
+  std::vector<uint8_t> mixed_;    // interleaved
   std::unique_ptr<InkTransform> ink_;
 };
 
-// Takes colors that were laid on white by their opacity off it.
+// Removes white from colors that were composited onto white by their opacity.
 void TakeOffWhite(std::span<const uint8_t> alpha, size_t samples, std::span<uint8_t> row) {
   for (size_t x = 0; x < alpha.size(); ++x) {
     const int32_t opacity = alpha[x];
@@ -203,7 +203,7 @@ Status ReadMerged(const PsdFile& document, const PictureRecord& picture, PackedI
   return Status::Ok;
 }
 
-// Copies the part of a layer's row that is on the canvas.
+// Copies the part of a layer's row within the canvas.
 void PlaceRow(std::span<const uint8_t> row, int32_t left, int32_t canvasWidth,
               std::span<uint8_t> target) {
   const auto bytes = static_cast<int64_t>(target.size()) / canvasWidth;

@@ -6,10 +6,10 @@
 
 namespace fotomill {
 
-// Photoshop documents. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when data
-// are cut short, MemoryAllocationError (6), UnsupportedFormat (8) for large documents (PSB), 32
-// bits a sample and unknown compressions, NoImages (20) for a document with neither a merged
-// picture nor layers.
+// Photoshop documents. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) if
+// truncated, MemoryAllocationError (6), UnsupportedFormat (8) for large documents (PSB), 32 bits
+// per sample and unknown compressions, NoImages (20) for a document with neither a merged picture
+// nor layers.
 Status PsdInfo(PictureRecord& picture, const ReadRequest& request);
 Status PsdRead(PictureRecord& picture, const ReadRequest& request);
 // Also ErrorCreatingFile (10), ErrorWritingFile (11).

@@ -3,31 +3,30 @@
 //   offset size  field
 //        0    4  "8BPS"
 //        4    2  version: 1; 2 is the large document (PSB)
-//        6    6  nothing
+//        6    6  unused
 //       12    2  channels, 1 to 56
 //       14    8  height, width
-//       22    2  bits of a sample: 1, 8, 16 or 32
+//       22    2  bits per sample: 1, 8, 16 or 32
 //       24    2  mode: 0 bitmap, 1 gray, 2 indexed, 3 RGB, 4 CMYK, 7 multichannel, 8 duotone, 9 Lab
-//       26    4  bytes of the color mode data, and these: the table of an indexed picture, 256
-//       reds, greens and blues
-//        .    4  bytes of the resources, and these: "8BIM", number (2), a counted text of even
-//        length, bytes (4), data
-//                padded to an even length
-//        .    4  bytes of the layers and masks, and these:
-//             4  bytes of the layers, and these: count (2), negative when the merged picture has
-//             opacity, then per layer
+//       26    4  size of the color mode data, then these: the table of an indexed picture, 256
+//                reds, greens and blues
+//        .    4  size of the resources, then these: "8BIM", number (2), a counted text of even
+//                length, size (4), data padded to an even length
+//        .    4  size of the layer and mask section, then:
+//             4  size of the layers, then: count (2), negative if the merged picture has opacity,
+//                and per layer
 //                  16  top, left, bottom, right
-//                   2  channels, then 6 bytes each: number (2), bytes of data (4)
-//                  12  "8BIM", blend mode (4), opacity, clipping, flags, nothing
-//                   4  bytes of further data, and these
-//                and the data of all channels of all layers
-//             4  bytes of the global mask, and these
-//                blocks: "8BIM" or "8B64", key (4), bytes (4), data padded to 4; "Lr16" holds the
-//                layers of 16 bits
-//        .       the merged picture: compression (2), rows of the first channel from the top, then
-//        of the next
+//                   2  channels, then 6 bytes each: number (2), data size (4)
+//                  12  "8BIM", blend mode (4), opacity, clipping, flags, unused
+//                   4  size of additional data, then these
+//                followed by the data of all channels of all layers
+//             4  size of the global mask, then the mask
+//                blocks: "8BIM" or "8B64", key (4), size (4), data padded to 4; "Lr16" has the
+//                layers of 16-bit documents
+//        .       the merged picture: compression (2), all rows of the first channel, top first,
+//                then of the next
 //
-// Compressions are 0 none, 1 PackBits with the bytes of all rows (2 each) in front, 2 deflate, 3
+// Compressions: 0 none, 1 PackBits, preceded by the sizes of all rows (2 each), 2 deflate, 3
 // deflate of differences. Source: Adobe, "Adobe Photoshop File Formats Specification" (2019).
 #include "formats/photoshop/psd_file.h"
 
@@ -42,9 +41,9 @@ namespace {
 
 constexpr std::string_view kSignature = "8BPS", kBlock = "8BIM", kWideBlock = "8B64";
 constexpr uint16_t kMostChannels = 56;
-constexpr int32_t kLongestLayerSide = 300000;  // that of large documents
+constexpr int32_t kLongestLayerSide = 300000;  // limit of large documents
 constexpr size_t kColorTableSize = 768;
-constexpr uint8_t kInkKind = 2;  // of channel information
+constexpr uint8_t kInkKind = 2;  // in the channel information
 
 Status CheckHeader(const PsdHeader& header) {
   const bool oneBit = header.mode == PsdMode::Bitmap;
@@ -76,8 +75,8 @@ Status ParseHeader(ByteReader& bytes, PsdHeader& header) {
   return version == 1 ? CheckHeader(header) : Status::DamagedFile;
 }
 
-// Whether the first entry of a list of channel information is a spot color; entries have their kind
-// at that offset.
+// Whether the first entry in a list of channel information is a spot color; `kindOffset` is the
+// offset of the kind within an entry.
 bool FirstIsInk(std::span<const uint8_t> list, size_t kindOffset) {
   return list.size() > kindOffset && list[kindOffset] == kInkKind;
 }
@@ -111,11 +110,11 @@ void TakeResource(PsdResource number, std::span<const uint8_t> data, PsdFile& do
   }
 }
 
-// Ends at the first resource that does not fit; what came before counts.
+// Stops at the first resource that does not fit; earlier ones are used.
 void ParseResources(std::span<const uint8_t> section, PsdFile& document) {
   ByteReader bytes(section);
   while (bytes.Left() > 0) {
-    bytes.Skip(4);  // "8BIM", and some others of the same layout
+    bytes.Skip(4);  // "8BIM", or another signature with the same layout
     const auto number = static_cast<PsdResource>(bytes.Be16());
     bytes.Skip(bytes.U8() | 1u);
     const uint32_t size = bytes.Be32();
@@ -132,7 +131,7 @@ bool HoldsPixels(const PsdLayer& layer) {
   return width > 0 && height > 0 && width <= kLongestLayerSide && height <= kLongestLayerSide;
 }
 
-// The layers of a section without its length. A section that does not fit ends the list.
+// The layers of a section, without its length. Stops if the data do not fit.
 void ParseLayers(std::span<const uint8_t> section, PsdFile& document) {
   ByteReader bytes(section);
   const auto count = static_cast<int16_t>(bytes.Be16());
@@ -169,7 +168,7 @@ void ParseLayers(std::span<const uint8_t> section, PsdFile& document) {
   document.layers = std::move(layers);
 }
 
-// The blocks behind layers and global mask, among which are the layers of 16 bits.
+// The blocks after layers and global mask, which include the layers of 16-bit documents.
 void ParseBlocks(ByteReader& bytes, PsdFile& document) {
   while (bytes.Left() >= 12) {
     if (!bytes.Match(kBlock) && !bytes.Match(kWideBlock)) return;

@@ -14,13 +14,13 @@ namespace fotomill {
 namespace {
 
 constexpr uint16_t kPlain = 0, kPackBits = 1, kDeflate = 2, kDeflateDifferences = 3;
-constexpr uint64_t kBestRatio = 1040;  // deflate makes data at most this much smaller
+constexpr uint64_t kBestRatio = 1040;  // maximum deflate compression
 
 uint16_t Be16At(std::span<const uint8_t> bytes, size_t index) {
   return static_cast<uint16_t>(bytes[2 * index] << 8 | bytes[2 * index + 1]);
 }
 
-// Each sample of a row is stored as its difference from the one before it.
+// Undoes the delta coding of a row.
 void SumRow(std::span<uint8_t> row, bool wide) {
   if (!wide) {
     for (size_t x = 1; x < row.size(); ++x) row[x] = static_cast<uint8_t>(row[x] + row[x - 1]);

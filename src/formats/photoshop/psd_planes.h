@@ -10,28 +10,28 @@
 
 namespace fotomill {
 
-// The rows of one channel from the top down, as samples of 8 bits or, of a bitmap, as 8 pixels a
-// byte.
+// The rows of one channel, top first, as 8-bit
+// samples or, for a bitmap, with 8 pixels per byte.
 class PsdPlane {
  public:
-  // The next row, `row` being as long as it is. DamagedFile when its code ends early, FileReadError
-  // when data are missing.
+  // The next row, of the size of `row`. DamagedFile if the packed row is incomplete, FileReadError
+  // if the data are truncated.
   Status Next(std::span<uint8_t> row);
 
  private:
   friend class PsdPlanes;
   bool packed_ = false;
-  std::span<const uint8_t> sizes_;  // of the packed rows that are to come, 2 bytes each
+  std::span<const uint8_t> sizes_;  // of the remaining packed rows, 2 bytes each
   std::span<const uint8_t> data_;
-  bool wide_ = false;              // samples of 16 bits
-  std::vector<uint8_t> unpacked_;  // a row of them
+  bool wide_ = false;              // 16-bit samples
+  std::vector<uint8_t> unpacked_;  // one row
 };
 
-// The channels of one compression: all of the merged picture, or one of a layer.
+// Channels with a common compression: all of the merged picture, or one of a layer.
 class PsdPlanes {
  public:
-  // `data` begins with the compression. Every channel has `height` rows of `width` samples.
-  // FileReadError when the data cannot hold them, DamagedFile, MemoryAllocationError,
+  // `data` starts with the compression. Every channel has `height` rows of `width` samples.
+  // FileReadError if the data are too short for them, DamagedFile, MemoryAllocationError,
   // UnsupportedFormat for an unknown compression.
   Status Open(std::span<const uint8_t> data, const PsdHeader& header, int32_t width, int32_t height,
               size_t channels);
@@ -47,7 +47,7 @@ class PsdPlanes {
   platform::MemoryBlock inflated_;
 };
 
-// Samples of 16 bits, high byte first, rounded to 8.
+// Rounds big-endian 16-bit samples to 8 bits.
 void NarrowPsdSamples(std::span<const uint8_t> wide, std::span<uint8_t> narrow);
 
 }  // namespace fotomill

@@ -1,6 +1,6 @@
-// The writer of Photoshop documents: a merged picture without layers, its rows in PackBits. Black
-// and white pictures are bitmaps, those of the gray ramp gray, other palettes indexed, everything
-// else RGB. EXIF, XMP, profile and resolution go along as resources.
+// The writer of Photoshop documents: a merged picture without layers, compressed with PackBits.
+// Black and white pictures become bitmaps, those with the gray ramp gray, other palettes indexed,
+// everything else RGB. EXIF, XMP, profile and resolution are stored as resources.
 #include <algorithm>
 #include <cmath>
 #include <vector>
@@ -32,7 +32,7 @@ PsdMode ModeFor(const PictureRecord& picture) {
   return bits == 1 && blackAndWhite ? PsdMode::Bitmap : PsdMode::Indexed;
 }
 
-// Writes a resource, whose data may be nothing to be written at all.
+// Writes a resource, or nothing if the data are empty.
 void WriteResource(ByteWriter& out, PsdResource number, std::span<const uint8_t> data) {
   if (data.empty()) return;
   out.Text("8BIM");
@@ -54,7 +54,7 @@ void WriteResolution(ByteWriter& out, const PictureMetadata& metadata) {
   out.Be32(16);
   for (const double dpi : {metadata.dpiX, metadata.dpiY}) {
     out.Be32(fixed(dpi));
-    out.Be16(1);  // per inch
+    out.Be16(1);  // pixels per inch
     out.Be16(1);  // sizes in inches
   }
 }
@@ -90,7 +90,7 @@ void WriteHeader(ByteWriter& out, const PackedImage& image, PsdMode mode) {
   out.Be16(static_cast<uint16_t>(mode));
 }
 
-// The rows of one channel, from the picture itself or gathered in `room_`.
+// The rows of one channel, as views into the picture or copied to `room_`.
 class ChannelRows {
  public:
   ChannelRows(const PictureRecord& picture, PsdMode mode)

@@ -1,9 +1,9 @@
-// Macintosh pictures (PICT): the pixels in them. The file layout is described in pict_file.cpp.
+// Macintosh pictures (PICT): the bitmaps in them. For the file layout see pict_file.cpp.
 //
-// A picture that holds one piece of pixels is shown as that piece, with its own palette or in 24
-// bits. Several are drawn where they belong in the frame, stretched where the picture says so.
-// Lines, shapes and text are passed over; the details tell how many there were. Alpha in the fourth
-// part of a pixel is not taken, as most programs leave anything there.
+// A single bitmap is shown by itself, with its own palette or in 24 bits. Several are drawn at
+// their positions in the frame, scaled as specified. Lines, shapes and text are ignored; the
+// details report how many there were. The fourth component of pixels is not used as alpha, as most
+// programs leave it undefined.
 #include "formats/pict/pict.h"
 
 #include <algorithm>
@@ -20,9 +20,9 @@ namespace fotomill {
 
 namespace {
 
-constexpr uint64_t kMostOverdraw = 64;  // how often the pieces of one picture may cover all of it
+constexpr uint64_t kMostOverdraw = 64;  // total area of the bitmaps, relative to the picture's
 
-// The stored rectangle of pixels that is drawn; all of them if the picture names none that fits.
+// The stored rectangle to draw; the whole bitmap if the picture does not specify a valid one.
 Rectangle Shown(const PictPixels& pixels) {
   const Rectangle& all = pixels.bounds;
   const Rectangle& part = pixels.source;
@@ -32,7 +32,7 @@ Rectangle Shown(const PictPixels& pixels) {
   return inside ? part : all;
 }
 
-// What is shown: one piece of pixels by itself, or a canvas with several.
+// The output: a single bitmap, or a canvas with several.
 struct View {
   int32_t width = 0, height = 0, bits = 24;
   bool canvas = false;
@@ -87,7 +87,7 @@ void DescribePicture(const PictFile& pict, const View& view, PictureRecord& pict
 
 void StoreIndices(std::span<const uint8_t> indices, int32_t bits, int32_t width,
                   std::span<uint8_t> row) {
-  if (bits == 2) {  // the picture holds 4 bits
+  if (bits == 2) {  // the picture has 4 bits
     for (size_t x = 0; x < static_cast<size_t>(width); ++x) {
       const auto value = static_cast<uint8_t>(indices[x / 4] >> (6 - 2 * (x % 4)) & 3);
       row[x / 2] = static_cast<uint8_t>(row[x / 2] | value << (x % 2 == 0 ? 4 : 0));
@@ -117,7 +117,7 @@ Status ReadPiece(const PictPixels& pixels, const View& view, const PictureRecord
   return Status::Ok;
 }
 
-// Draws row `y` of `height`, pixels of three bytes, into its place on the canvas.
+// Draws row `y` of `height`, three bytes per pixel, at its position on the canvas.
 void DrawRow(std::span<const uint8_t> bgr, int32_t y, int32_t height, const Rectangle& target,
              PackedImage& canvas) {
   const auto width = static_cast<int64_t>(bgr.size() / 3);
@@ -135,8 +135,8 @@ void DrawRow(std::span<const uint8_t> bgr, int32_t y, int32_t height, const Rect
   }
 }
 
-// Hands the rows of a JPEG file to `draw`: blue, green, red, the row's number, and how many there
-// are.
+// Passes the rows of a JPEG file to `draw`: blue, green, red, the row number, and the
+// number of rows.
 template <typename Draw>
 Status ReadJpeg(std::span<const uint8_t> file, Draw draw) {
   JpegReader reader;
@@ -162,7 +162,7 @@ Status ReadJpeg(std::span<const uint8_t> file, Draw draw) {
   return reader.errors.cutShort && reader.errors.endMissing ? Status::FileReadError : Status::Ok;
 }
 
-// How many pixels of a canvas a rectangle covers.
+// Number of canvas pixels in a rectangle.
 uint64_t PixelsOn(const PackedImage& canvas, const Rectangle& target) {
   const int32_t width = std::min(target.x + target.width, canvas.Width()) - std::max(target.x, 0);
   const int32_t height =

@@ -6,9 +6,9 @@
 
 namespace fotomill {
 
-// Macintosh pictures (PICT). Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when
-// data are cut short, MemoryAllocationError (6), UnsupportedFormat (8) for kinds of pixels that are
-// not decoded, NoImages (20) for a drawing without any pixels.
+// Macintosh pictures (PICT). Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) if
+// truncated, MemoryAllocationError (6), UnsupportedFormat (8) for unsupported pixel formats,
+// NoImages (20) for a drawing without bitmaps.
 Status PictInfo(PictureRecord& picture, const ReadRequest& request);
 Status PictRead(PictureRecord& picture, const ReadRequest& request);
 // Also ErrorCreatingFile (10), ErrorWritingFile (11).

@@ -1,35 +1,34 @@
 // The layout of a Macintosh picture (PICT), big-endian.
 //
 //   offset size  field
-//        0  512  nothing, or this part is missing
-//        0    2  bytes of the picture, low half
+//        0  512  unused; optional
+//        0    2  size of the picture, low half
 //        2    8  frame: top, left, bottom, right
-//       10       version 1: 11 01, operations of one byte; version 2: 00 11 02 FF, operations of 2
-//       bytes at even offsets
+//       10       version 1: 11 01, opcodes of one byte; version 2: 00 11 02 FF, opcodes of 2 bytes
+//                at even offsets
 //
-// Operations that hold pixels: 90, 91 (those of a region) bits as they are; 98, 99 packed; 9A, 9B
-// without color table:
+// Opcodes with pixels: 90, 91 (with a region) unpacked bits; 98, 99 packed; 9A, 9B without color
+// table:
 //       9A, 9B: 4  base address, FF
-//        2  bytes of a row; 0x8000: a pixel map
+//        2  bytes per row; 0x8000: a pixel map
 //        8  bounds
 //       36  of a pixel map: version (2), pack type (2), pack size (4), resolutions (8), pixel type
-//       (2), bits of a pixel (2),
-//           parts (2), bits of a part (2), nothing (12)
-//        .  of a pixel map with colors: seed (4), flags (2), entries less one (2), entries of
-//        index, red, green, blue (2 each)
+//           (2), bits per pixel (2), components (2), bits per component (2), unused (12)
+//        .  of a pixel map with colors: seed (4), flags (2), entries minus one (2), entries of
+//           index, red, green, blue (2 each)
 //       18  source and target rectangle, mode
-//        .  91, 99, 9B: region: bytes (2, themselves included), data
-//        .  rows; a packed one behind the number of its bytes, in 1 byte where an unpacked row has
-//        at most 250, else in 2
+//        .  91, 99, 9B: region: size (2, including itself), data
+//        .  rows; packed ones are preceded by their size, in 1 byte if an unpacked row has at most
+//           250, else in 2
 //
-// 8200 holds a compressed picture of QuickTime: bytes (4), version (2), matrix (36), matte size
-// (4), matte (8), mode (2), source (8), accuracy (4), mask size (4), if there is a matte its
-// description and data, the mask, then the description of the picture: its bytes (4), type (4),
-// ..., width at 32, height at 34, bytes of data at 44, and the data.
+// 8200 has a compressed QuickTime picture: size (4), version (2), matrix (36), matte size (4),
+// matte (8), mode (2), source (8), accuracy (4), mask size (4), if there is a matte its description
+// and data, the mask, then the description of the picture: its size (4), type (4), ..., width at
+// 32, height at 34, size of the data at 44, and the data.
 //
-// Some programs chose the size of the counts by the bytes that are packed, without the fourth part;
-// where the file makes no sense otherwise, it is read that way. All other operations are skipped by
-// their sizes, as the source tells them. Source: Apple Computer, "Inside Macintosh: Imaging With
+// Some programs based the width of the row sizes on the packed data, without the fourth component;
+// it is read that way if the file is otherwise invalid. All other opcodes are skipped by their
+// sizes according to the source. Source: Apple Computer, "Inside Macintosh: Imaging With
 // QuickDraw", appendix A (1994), and "QuickTime File Format".
 #include "formats/pict/pict_file.h"
 
@@ -46,9 +45,9 @@ constexpr uint64_t kPreamble = 512;
 constexpr uint32_t kEnd = 0xff, kVersion = 0x11, kQuickTime = 0x8200;
 constexpr uint16_t kIsPixelMap = 0x8000;
 constexpr size_t kShortRow = 8, kLongRow = 250;
-constexpr size_t kMostPixels = 65536;  // pieces of one picture
+constexpr size_t kMostPixels = 65536;  // bitmaps per picture
 
-// How long the data of an operation is: a number of bytes, or one of these.
+// Size of an opcode's data: a number of bytes, or one of these.
 enum Size : int8_t {
   Word = -1,
   Long = -2,
@@ -61,7 +60,7 @@ enum Size : int8_t {
 
 struct Operations {
   uint32_t first, last;
-  int8_t size;          // bytes; with Text, `before` come before the counted text
+  int8_t size;          // bytes; with Text, `before` bytes precede the counted text
   bool draws = false;
   int8_t before = 0;
 };
@@ -102,7 +101,7 @@ Rectangle TakeRectangle(ByteReader& bytes) {
   return rectangle;
 }
 
-// A size of 2 bytes that counts itself, and what follows.
+// Skips a 2-byte size that includes itself, and its data.
 void SkipRegion(ByteReader& bytes) {
   const uint16_t size = bytes.Be16();
   bytes.Skip(std::max<uint16_t>(size, 2) - 2u);
@@ -123,15 +122,14 @@ void TakeColorTable(ByteReader& bytes, PictPixels& pixels) {
   pixels.colorTable = bytes.Take((bytes.Be16() + uint64_t{1}) * 8);
 }
 
-// The bytes of packed rows and their counts; more than there are when they do not end within the
-// data.
+// Total size of packed rows and their counts; larger than the data if they are truncated.
 uint64_t PackedSize(ByteReader rows, size_t height, bool longCounts) {
   const uint64_t begin = rows.Position(), left = rows.Left();
   for (size_t y = 0; y < height && rows.Ok(); ++y) rows.Skip(longCounts ? rows.Be16() : rows.U8());
   return rows.Ok() ? rows.Position() - begin : left + 1;
 }
 
-// The rows, at the place that `pixels` names.
+// Reads the rows according to `pixels`.
 void TakeRows(ByteReader& bytes, PictPixels& pixels) {
   const auto height = static_cast<size_t>(std::max(pixels.bounds.height, 0));
   if (!pixels.packed) {
@@ -164,7 +162,7 @@ bool IsDecoded(const PictPixels& pixels) {
   return pixels.bits == 32 && pixels.packType != 3 && pixels.rowBytes >= 4 * width;
 }
 
-// What follows one of the operations with pixels.
+// Reads the data of an opcode with pixels.
 void TakePixels(uint32_t code, ByteReader& bytes, PictFile& pict) {
   PictPixels pixels;
   const bool direct = code >= 0x9a, ofRegion = code % 2 != 0;
@@ -193,7 +191,7 @@ void TakePixels(uint32_t code, ByteReader& bytes, PictFile& pict) {
   }
 }
 
-// A pattern of pixels has the pixels' layout without source, target and mode.
+// A pixel pattern has the same layout as pixels, without source, target and mode.
 void SkipPattern(ByteReader& bytes) {
   const uint16_t kind = bytes.Be16();
   bytes.Skip(8);
@@ -239,7 +237,7 @@ void TakeQuickTime(std::span<const uint8_t> data, PictFile& pict) {
   if (pict.pixels.size() < kMostPixels) pict.pixels.push_back(pixels);
 }
 
-// Data of an operation that holds no pixels.
+// Skips the data of an opcode without pixels.
 void SkipData(const Operations& operation, ByteReader& bytes) {
   switch (operation.size) {
     case Word: return bytes.Skip(bytes.Be16());
@@ -252,7 +250,7 @@ void SkipData(const Operations& operation, ByteReader& bytes) {
   }
 }
 
-// One operation. False at the end of the picture.
+// Processes one opcode. False at the end of the picture.
 bool TakeOperation(ByteReader& bytes, PictFile& pict) {
   const uint64_t begin = bytes.Position();
   const uint32_t code = pict.version == 1 ? bytes.U8() : bytes.Be16();
@@ -273,7 +271,7 @@ bool TakeOperation(ByteReader& bytes, PictFile& pict) {
   return bytes.Ok();
 }
 
-// The version of a picture that begins at the offset; 0 when there is none.
+// The version of a picture that starts at the offset; 0 if there is none.
 int32_t VersionAt(std::span<const uint8_t> file, uint64_t offset) {
   ByteReader bytes(file);
   bytes.Seek(offset + 10);

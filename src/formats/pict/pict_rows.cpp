@@ -10,7 +10,7 @@ namespace fotomill {
 
 namespace {
 
-// PackBits of pixels of 2 bytes in place of bytes.
+// PackBits with 2-byte units.
 bool UnpackPixels(std::span<const uint8_t> code, std::span<uint8_t> row) {
   ByteReader bytes(code);
   size_t at = 0;

@@ -9,12 +9,12 @@
 
 namespace fotomill {
 
-// The stored rows of a picture's pixels, from the top down. Not for JPEG.
+// Decodes the rows of a bitmap, top first. Not for JPEG.
 class PictRowDecoder {
  public:
   explicit PictRowDecoder(const PictPixels& pixels);
 
-  // Unpacks the next row. FileReadError when its code ends early.
+  // Unpacks the next row. FileReadError if the packed row is incomplete.
   Status Next();
   // The row: indices of `bits` bits each, or blue, green, red.
   std::span<const uint8_t> Indices() const { return raw_; }
@@ -28,7 +28,7 @@ class PictRowDecoder {
 
   const PictPixels& pixels_;
   std::span<const uint8_t> data_;
-  std::vector<uint8_t> raw_;  // one row as it was before packing
+  std::vector<uint8_t> raw_;  // one unpacked row
   std::vector<uint8_t> bgr_;
   Palette palette_{};
 };

@@ -1,5 +1,5 @@
-// The writer of Macintosh pictures: version 2 with the preamble, one piece of direct pixels, packed
-// by colors.
+// The writer of Macintosh pictures: version 2 with the 512-byte preamble, one bitmap of direct
+// pixels, packed by components.
 #include <vector>
 
 #include "core/byte_writer.h"
@@ -12,7 +12,7 @@ namespace fotomill {
 namespace {
 
 constexpr uint32_t kScreenResolution = 72 << 16;
-// their type, bits of a pixel, parts, bits of a part
+// pixel type, bits per pixel, components, bits per component
 constexpr uint16_t kDirectPixels[] = {16, 32, 3, 8};
 constexpr size_t kLongRow = 250;
 constexpr uint64_t kPreamble = 512;
@@ -25,14 +25,14 @@ void WriteFrame(ByteWriter& out, const PackedImage& image) {
 
 void WriteHead(ByteWriter& out, const PackedImage& image) {
   out.Zeros(kPreamble);
-  out.Be16(0);  // the size's low half comes at the end
+  out.Be16(0);  // low half of the size, patched at the end
   WriteFrame(out, image);
   for (const int word : {0x0011, 0x02ff, 0x0c00, 0xfffe, 0}) out.Be16(static_cast<uint16_t>(word));
   out.Be32(kScreenResolution);
   out.Be32(kScreenResolution);
   WriteFrame(out, image);
   out.Be32(0);
-  out.Be16(0x0001);  // all may be drawn on
+  out.Be16(0x0001);  // clip to the whole frame
   out.Be16(10);
   WriteFrame(out, image);
 }
@@ -43,7 +43,7 @@ void WritePixelMap(ByteWriter& out, const PackedImage& image) {
   out.Be16(static_cast<uint16_t>(0x8000 | 4 * image.Width()));
   WriteFrame(out, image);
   out.Be16(0);
-  out.Be16(4);  // packed by colors
+  out.Be16(4);  // packed by components
   out.Be32(0);
   out.Be32(kScreenResolution);
   out.Be32(kScreenResolution);
@@ -51,10 +51,10 @@ void WritePixelMap(ByteWriter& out, const PackedImage& image) {
   out.Zeros(12);
   WriteFrame(out, image);
   WriteFrame(out, image);
-  out.Be16(0);  // replaces what is there
+  out.Be16(0);  // copy mode
 }
 
-// The red, then the green, then the blue parts of a row.
+// The red, then the green, then the blue components of a row.
 void GatherRow(const PictureRecord& picture, int32_t y, std::span<uint8_t> parts) {
   const auto width = static_cast<size_t>(picture.image.Width());
   if (picture.image.Bits() == 24) {
@@ -73,7 +73,7 @@ Status WriteRows(ByteWriter& out, const PictureRecord& picture) {
   for (int32_t y = 0; y < picture.image.Height() && !out.Failed(); ++y) {
     RETURN_IF_BAD(picture.ReportRow(y, picture.image.Height()));
     GatherRow(picture, y, parts);
-    if (4 * width < 8) {  // too short to be packed: a byte of nothing, red, green, blue
+    if (4 * width < 8) {  // too short to be packed: an unused byte, red, green, blue
       for (size_t x = 0; x < width; ++x) {
         out.U8(0);
         for (size_t c = 0; c < 3; ++c) out.U8(parts[c * width + x]);

@@ -9,7 +9,7 @@ namespace {
 
 using namespace std::string_view_literals;
 
-// Version 2 as in memory, and behind the preamble of files.
+// Version 2, without and with the preamble of files.
 constexpr Signature kSignatures[] = {
     {10, "\0\x11\x02\xff"sv, TrLater("a Macintosh picture")},
     {522, "\0\x11\x02\xff\x0c\0"sv, TrLater("a Macintosh picture")}};

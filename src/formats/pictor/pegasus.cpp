@@ -1,20 +1,20 @@
-// Pegasus pictures (PIC), and Konica Quality Photos (KQP), little-endian: the head of a bitmap with
-// a JPEG stream that lacks tables.
+// Pegasus pictures (PIC), and Konica Quality Photos (KQP), little-endian: a bitmap header with a
+// JPEG stream that lacks tables.
 //
 //   offset size  field
 //        0    2  "BM"
 //       10    4  offset of the data
-//       14    4  size of the header that begins here, 68
+//       14    4  size of the header that starts here, 68
 //       30    4  compression, "JPEG"
 //
-// The stream has a segment APP1 that begins with "PIC", 0, and three bytes: one unknown, the code
-// of the luma's quantizer and that of the chroma's. A table is that of T.81, K.1, times its code
-// / 32. Huffman tables that are missing are those of T.81, K.3. Streams that have all their tables,
-// and those without the head of a bitmap, are read as well.
+// The stream has an APP1 segment that starts with "PIC", 0, and three bytes: one unknown, then the
+// codes of the luma and chroma quantization tables. A table is that of T.81, K.1, times its code /
+// 32. Missing Huffman tables are those of T.81, K.3. Streams with all tables, and those without a
+// bitmap header, are supported as well.
 //
-// The maker's own coder, ELS, was never described: such data are told by a kind of frame that is
-// none of the Huffman-coded ones, or by another name of the compression.
-// Sources: File Formats Wiki (Archive Team), Pegasus PIC, unofficial; ITU-T T.81 (1992).
+// The vendor's proprietary ELS coding was never documented; such data are recognized by a frame
+// type that is not Huffman-coded, or by another compression name. Sources: File Formats Wiki
+// (Archive Team), Pegasus PIC, unofficial; ITU-T T.81 (1992).
 #include "formats/pictor/pegasus.h"
 
 #include <algorithm>
@@ -27,7 +27,7 @@ namespace fotomill {
 namespace {
 
 constexpr uint64_t kBitmapHead = 14, kCompressionAt = 30;
-constexpr uint32_t kLastBitmapCompression = 6;  // of real bitmaps
+constexpr uint32_t kLastBitmapCompression = 6;  // maximum value in real bitmaps
 
 // T.81, tables K.1 and K.2, in zigzag order.
 constexpr uint8_t kQuantizers[2][64] = {
@@ -43,7 +43,7 @@ bool BeginsStream(std::span<const uint8_t> bytes) {
   return bytes.size() >= 3 && bytes[0] == 0xFF && bytes[1] == 0xD8 && bytes[2] == 0xFF;
 }
 
-// The stream behind a bitmap's head: where the head tells, else the first one that follows it.
+// The stream after a bitmap header: at the offset in the header, else the first one found.
 std::span<const uint8_t> StreamBehind(std::span<const uint8_t> file, uint64_t told, uint64_t head) {
   if (told < file.size() && BeginsStream(file.subspan(told))) return file.subspan(told);
   const uint64_t last = std::min<uint64_t>(file.size(), head + limits.garbageBytes);

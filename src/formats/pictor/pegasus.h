@@ -8,13 +8,13 @@
 
 namespace fotomill {
 
-// A JPEG stream without quantizer tables, and the tables that belong to it.
+// A JPEG stream without quantization tables, and the tables for it.
 struct PegasusStream {
   std::span<const uint8_t> data = {};
-  bool bare = false;  // the file is the stream, without a bitmap's head
-  // the codes of the "PIC" segment: 32 means the tables of T.81, K.1. 0 if there is none.
+  bool bare = false;  // the file is a stream without a bitmap header
+  // from the "PIC" segment: 32 selects the tables of T.81, K.1; 0 if there is none
   uint8_t lumaCode = 0, chromaCode = 0;
-  // an abbreviated stream with two quantizer tables; empty without codes
+  // an abbreviated stream with two quantization tables; empty without codes
   std::array<uint8_t, 2 + 2 * (5 + 64) + 2> tables = {};
   bool hasTables = false;
 
@@ -23,8 +23,8 @@ struct PegasusStream {
   }
 };
 
-// Finds the stream in a file. DamagedFile, FileReadError for a file that ends within its heads,
-// UnsupportedFormat for data that are not of JPEG's own coders.
+// Finds the stream in a file. DamagedFile, FileReadError for a truncated header, UnsupportedFormat
+// for data in a coding other than JPEG's.
 Status FindPegasusStream(std::span<const uint8_t> file, PegasusStream& stream);
 
 }  // namespace fotomill

@@ -5,7 +5,7 @@
 
 namespace fotomill {
 
-// Files named PIC, which may be Pictor pictures or those of Pegasus, and KQP, which are the latter.
+// PIC files, which may be Pictor or Pegasus pictures, and KQP files, which are the latter.
 // Statuses: FileOpenError (1), and those of PictorRead and JpegRead.
 Status PicInfo(PictureRecord& picture, const ReadRequest& request);
 Status PicRead(PictureRecord& picture, const ReadRequest& request);

@@ -4,25 +4,25 @@
 //        0    2  magic number 0x1234
 //        2    4  width, height
 //        6    4  left and lower edge on the screen
-//       10    1  bits of a pixel in one plane; higher 4 bits: planes, less one
-//       11    1  FF; in the oldest files nothing of the following is there
+//       10    1  bits per pixel and plane; upper 4 bits: planes minus one
+//       11    1  FF; the oldest files have none of the following
 //       12    1  screen mode, a letter, or a digit for text
-//       13    2  kind of palette: 0 none, 1 CGA, 2 PCjr, 3 EGA, 4 VGA
-//       15    2  bytes of the palette
-//       17       palette: of CGA the number of one of six, of PCjr an index of 0 to 15 for each of
-//                16 colors, of EGA one of 0 to 63, of VGA red, green and blue from 0 to 63 each
-//        .    2  number of blocks; 0: the data are plain
-//        .       data: the rows of the first plane from the bottom up, then those of the next
+//       13    2  palette type: 0 none, 1 CGA, 2 PCjr, 3 EGA, 4 VGA
+//       15    2  size of the palette
+//       17       palette: CGA: one of six palettes; PCjr: an index of 0 to 15 for each of 16
+//                colors; EGA: an index of 0 to 63; VGA: red, green and blue from 0 to 63 each
+//        .    2  number of blocks; 0: uncompressed data
+//        .       data: the rows of the first plane, bottom row first, then those of the next
 //
-// Each row of a plane is whole bytes, pixels from the highest bits down; the first plane holds the
-// lowest bit of all pixels. Blocks are described in pictor_runs.cpp.
+// Each row of a plane is padded to whole bytes, the leftmost pixel in the highest bits; the first
+// plane has the lowest bit of all pixels. Blocks are described in pictor_runs.cpp.
 //
-// Read are one plane of 1, 2, 4 or 8 bits and up to four of 1 bit. Text screens and pictures of 24
-// bits are not. Written are pictures of up to 8 bits with a VGA palette, so colors have 6 bits:
-// black and white, 16 colors in four planes, or 256. Some readers know no padding at the end of
-// rows. So a picture whose rows would have any is written in 256 colors.
-// Source: J. Bridges, "Pictor/PC Paint Format" (1988), in Murray and vanRyper, Encyclopedia of
-// Graphics File Formats (1996).
+// The reader supports one plane of 1, 2, 4 or 8 bits and up to four of 1 bit, but not text screens
+// and 24-bit pictures. The writer stores pictures of up to 8 bits with a VGA palette, so colors
+// have 6 bits: black and white, 16 colors in four planes, or 256. Some readers do not expect
+// padding at the end of rows, so pictures that would need any are stored in 256 colors. Source: J.
+// Bridges, "Pictor/PC Paint Format" (1988), in Murray and vanRyper, Encyclopedia of Graphics File
+// Formats (1996).
 #include "formats/pictor/pictor.h"
 
 #include <algorithm>
@@ -99,7 +99,7 @@ void SetColor(Palette& palette, size_t index, uint32_t rgb) {
   for (size_t i = 0; i < 3; ++i) palette[3 * index + i] = static_cast<uint8_t>(rgb >> (16 - 8 * i));
 }
 
-// Of the low bits red, green and blue with two thirds, of the high ones with one third.
+// The low bits of red, green and blue count two thirds, the high ones one third.
 uint32_t EgaColor(uint32_t value) {
   const auto part = [&](int low) {
     return (value >> low & 1) * 0xAA + (value >> (low + 3) & 1) * 0x55;
@@ -107,7 +107,7 @@ uint32_t EgaColor(uint32_t value) {
   return part(2) << 16 | part(1) << 8 | part(0);
 }
 
-// The colors of CGA, where dark yellow is brown.
+// The CGA colors, with brown for dark yellow.
 uint32_t CgaColor(uint32_t index) {
   return index == 6 ? 0xAA5500 : EgaColor((index & 7) | ((index & 8) != 0 ? 0x38 : 0));
 }
@@ -149,7 +149,7 @@ Palette ReadPalette(const PictorHeader& header) {
   return palette;
 }
 
-// Rows of one plane of pixels of 2 bits as an image has them, of 4.
+// Converts rows of 2-bit pixels to 4-bit pixels.
 void WidenRow(std::span<const uint8_t> row, std::span<uint8_t> target) {
   for (size_t x = 0; x < row.size(); ++x) {
     const uint8_t byte = row[x];
@@ -159,7 +159,7 @@ void WidenRow(std::span<const uint8_t> row, std::span<uint8_t> target) {
   }
 }
 
-// For each byte of a plane, the four bytes of eight pixels whose lowest bits it holds.
+// For each byte of a plane, the four bytes of eight 4-bit pixels with these lowest bits.
 constexpr auto kSpread = [] {
   std::array<std::array<uint8_t, 4>, 256> spread = {};
   for (size_t byte = 0; byte < 256; ++byte) {
@@ -170,7 +170,7 @@ constexpr auto kSpread = [] {
   return spread;
 }();
 
-// Sets bit `plane` of the pixels of a row of 4 bits, which is whole groups of 8 pixels.
+// Sets bit `plane` of the pixels in a 4-bit row, which must be padded to 8 pixels.
 void AddPlane(std::span<const uint8_t> row, int32_t plane, std::span<uint8_t> target) {
   for (size_t x = 0; x < row.size(); ++x) {
     for (size_t i = 0; i < 4; ++i)
@@ -206,7 +206,7 @@ void Describe(const PictorHeader& header, PictureRecord& picture) {
   picture.palette = ReadPalette(header);
 }
 
-// How a picture is stored: 1, 4 or 8 bits.
+// The bit depth to store a picture in: 1, 4 or 8.
 int32_t StoredDepth(const PackedImage& image) {
   return image.Bits() == 8 || image.Width() % 8 != 0 ? 8 : image.Bits();
 }
@@ -231,7 +231,7 @@ void WriteHeader(ByteWriter& out, const PictureRecord& picture, int32_t depth, u
   out.Le16(static_cast<uint16_t>((bytes + kPictorBlock - 1) / kPictorBlock));
 }
 
-// One plane of a row of 4 bits.
+// Extracts one plane of a 4-bit row.
 void TakePlane(std::span<const uint8_t> row, int32_t plane, std::span<uint8_t> target) {
   for (size_t x = 0; x < target.size(); ++x) {
     uint32_t byte = 0;
@@ -243,7 +243,7 @@ void TakePlane(std::span<const uint8_t> row, int32_t plane, std::span<uint8_t> t
   }
 }
 
-// A row of less than 8 bits, a byte a pixel.
+// Unpacks a row of less than 8 bits to one byte per pixel.
 void WidenToBytes(std::span<const uint8_t> row, size_t bits, std::span<uint8_t> target) {
   const size_t perByte = 8 / bits;
   for (size_t x = 0; x < target.size(); ++x) {

@@ -1,13 +1,13 @@
 // The run-length code of Pictor files, little-endian. A block:
 //
 //   offset size  field
-//        0    2  its length, this head included
-//        2    2  its length when unpacked
+//        0    2  its size, including this header
+//        2    2  unpacked size
 //        4    1  marker
-//        5       bytes that stand for themselves; or the marker, a count from 1 (1 byte) and the
-//                byte that is repeated; or the marker, 0, a count (2 bytes) and the byte
+//        5       literal bytes; or the marker, a count from 1 (1 byte) and the byte to repeat; or
+//                the marker, 0, a count (2 bytes) and the byte
 //
-// Runs end with their block here; readers go on.
+// The writer ends runs with the block; the reader accepts runs across blocks.
 // Source: J. Bridges, "Pictor/PC Paint Format" (1988), in Murray and vanRyper, Encyclopedia of
 // Graphics File Formats (1996).
 #include "formats/pictor/pictor_runs.h"
@@ -68,7 +68,7 @@ bool PictorData::Next(std::span<uint8_t> row) {
   size_t x = 0;
   while (x < row.size()) {
     if (run_ == 0) {
-      // bytes up to the next marker stand for themselves
+      // bytes up to the next marker are literals
       const size_t most = std::min(end_ - at_, row.size() - x);
       const void* found = most == 0 ? nullptr : std::memchr(&data_[at_], marker_, most);
       const size_t count =

@@ -10,7 +10,7 @@ namespace {
 
 using namespace std::string_view_literals;
 
-// A bitmap whose compression begins with "JP", in colors and in grays.
+// A bitmap whose compression starts with "JP", in color and in gray.
 constexpr Signature kSignatures[] = {{0, "BM"sv, "Pegasus JPEG", 26, "\1\0\x18\0JP"sv},
                                      {0, "BM"sv, "Pegasus JPEG", 26, "\1\0\x08\0JP"sv},
                                      {0, "\x34\x12"sv, "Pictor"},

@@ -1,19 +1,19 @@
-// Portable Network Graphics (PNG), big-endian; png_write.cpp writes.
+// Portable Network Graphics (PNG), big-endian; png_write.cpp is the writer.
 //
 //   signature 89 50 4E 47 0D 0A 1A 0A, then chunks of length, type, data and CRC:
 //   IHDR  width, height (4 bytes each), bit depth, color type (1 color, 2 palette bit, 4 alpha), 0,
-//   0, interlace PLTE, tRNS, pHYs, gAMA, iCCP, eXIf, tEXt, zTXt, iTXt, acTL ..., IDAT (deflated
-//   rows), IEND
+//         0, interlace
+//   PLTE, tRNS, pHYs, gAMA, iCCP, eXIf, tEXt, zTXt, iTXt, acTL ..., IDAT (deflated rows), IEND
 //
-// What the reader makes of it: palettes and grays of 1, 2, 4 and 8 bits without transparency keep
-// their depth (grays with a gray palette); everything else becomes 24 bits, with an alpha plane
-// if there is an alpha channel or a transparent color. 16-bit samples are rounded to 8. Gamma is
-// told, not applied. Of an animation (acTL) the default picture is shown. EXIF, XMP, ICC profile
-// and resolution travel with the picture.
+// Reader: palettes and grays of 1, 2, 4 and 8 bits without transparency keep their depth (grays
+// with a gray palette); everything else becomes 24 bits, with an alpha plane if there is an alpha
+// channel or a transparent color. 16-bit samples are rounded to 8. Gamma is reported, not applied.
+// For an animation (acTL) the default picture is shown. EXIF, XMP, ICC profile and resolution are
+// kept.
 //
-// libpng reads everything in front of the pixels. Pixels that are not interlaced are inflated by
-// libdeflate as a whole and unfiltered here, which takes half the time; interlaced ones, rare forms
-// and whatever looks damaged are libpng's. Source: W3C, "Portable Network Graphics (PNG)
+// libpng reads everything before the pixels. Non-interlaced pixels are inflated by libdeflate at
+// once and unfiltered here, which takes half the time; interlaced ones, rare pixel formats and
+// anything that looks damaged are left to libpng. Source: W3C, "Portable Network Graphics (PNG)
 // Specification (Third Edition)", 2025; libpng manual.
 #include "formats/png/png.h"
 
@@ -47,7 +47,7 @@ constexpr png_uint_32 kMostSide = 0x7fffffff;
 constexpr png_alloc_size_t kMostChunkMemory = 64u << 20;
 constexpr png_byte kTextChunks[] = "tEXt\0zTXt\0iTXt";
 
-// A file being read, with the library's two structures.
+// A file being read, with libpng's two structures.
 struct PngReader {
   explicit PngReader(std::span<const uint8_t> data) : file(data), bytes(data) {
     png = png_create_read_struct(PNG_LIBPNG_VER_STRING, nullptr, OnPngError, OnPngWarning);
@@ -57,7 +57,7 @@ struct PngReader {
   PngReader(const PngReader&) = delete;
   PngReader& operator=(const PngReader&) = delete;
   bool Ready() const { return info != nullptr; }
-  // What a failed library call means.
+  // The status for a failed library call.
   Status Failure() const { return bytes.Ok() ? Status::DamagedFile : Status::FileReadError; }
 
   std::span<const uint8_t> file;
@@ -73,10 +73,10 @@ void ReadBytes(png_structp png, png_bytep target, size_t count) {
   std::memcpy(target, bytes.data(), count);
 }
 
-// How the rows come out of the library.
+// Row format delivered by the library.
 enum class RowForm {
-  Direct,    // as the picture stores them
-  TwoBits,   // one index a byte, to be packed into 4 bits
+  Direct,    // as stored in the picture
+  TwoBits,   // one index per byte, to be packed into 4 bits
   WithAlpha  // blue, green, red, alpha
 };
 
@@ -87,8 +87,8 @@ struct PngLayout {
   RowForm rows = RowForm::Direct;
 };
 
-// Whether the chunks in front of the pixels are within the file: for one that only claims a size
-// the library would make room.
+// Whether the chunks before the pixels are within the file: the library would allocate memory for
+// any size they claim.
 Status CheckHead(std::span<const uint8_t> file) {
   PngWalk walk(file);
   for (PngPlace chunk; walk.Next(chunk);) {
@@ -97,7 +97,7 @@ Status CheckHead(std::span<const uint8_t> file) {
   return walk.Outcome() == Status::DamagedFile ? Status::DamagedFile : Status::FileReadError;
 }
 
-// Reads everything before the pixels and sets up the conversions.
+// Reads everything before the pixels and sets up conversions.
 Status ReadHeader(PngReader& reader) {
   if (!reader.Ready()) return Status::MemoryAllocationError;
   RETURN_IF_BAD(CheckHead(reader.file));
@@ -105,7 +105,7 @@ Status ReadHeader(PngReader& reader) {
     png_set_read_fn(reader.png, &reader, ReadBytes);
     png_set_user_limits(reader.png, kMostSide, kMostSide);
     png_set_chunk_malloc_max(reader.png, kMostChunkMemory);
-    // The library would inflate every text there is.
+    // The library would inflate all texts.
     png_set_keep_unknown_chunks(reader.png, PNG_HANDLE_CHUNK_NEVER, kTextChunks, 3);
     png_read_info(reader.png, reader.info);
   });
@@ -163,7 +163,7 @@ void TakePalette(const PngReader& reader, const PngLayout& layout, Palette& pale
   palette = GrayLevels(layout.bitsPerPixel);
 }
 
-// The two texts that travel with a picture, the last of each name; no others are inflated.
+// The two texts that are kept with a picture, the last one of each keyword; no others are inflated.
 void TakeTexts(std::span<const uint8_t> file, PictureRecord& picture) {
   PngChunks chunks(file);
   PngChunk chunk, xmp, comment;
@@ -198,8 +198,8 @@ void TakeMetadata(const PngReader& reader, PictureRecord& picture) {
   }
 }
 
-// The number of frames that an animation's acTL chunk names, as far as the file has them, 1 for a
-// still picture. The chunk comes before the pixels, and each frame has an fcTL chunk.
+// The number of frames in an animation's acTL chunk, limited to those in the file, 1 for a still
+// picture. The chunk precedes the pixels, and each frame has an fcTL chunk.
 int32_t FrameCount(std::span<const uint8_t> file) {
   PngChunks chunks(file);
   PngChunk chunk;
@@ -213,7 +213,7 @@ int32_t FrameCount(std::span<const uint8_t> file) {
   return static_cast<int32_t>(std::max(std::min(named, there), 1u));
 }
 
-// Fills the facts.
+// Fills in the record.
 Status Describe(PngReader& reader, std::span<const uint8_t> file, PngLayout& layout,
                 const ReadOptions& options, PictureRecord& picture) {
   RETURN_IF_BAD(ReadHeader(reader));
@@ -255,7 +255,7 @@ void StoreRow(const PngLayout& layout, const uint8_t* source, int32_t y, PngTarg
   }
 }
 
-// Rows that come in order: straight into the picture, or through one row. `done`: how many came.
+// Reads non-interlaced rows, directly into the picture or through a row buffer. `done`: rows read.
 Status ReadInOrder(PngReader& reader, const PngLayout& layout, const PictureRecord& picture,
                    PngTarget& target, int32_t& done) {
   std::vector<uint8_t> row(png_get_rowbytes(reader.png, reader.info));
@@ -272,8 +272,8 @@ Status ReadInOrder(PngReader& reader, const PngLayout& layout, const PictureReco
   return read ? status : reader.Failure();
 }
 
-// Interlaced rows come in seven passes, each of which fills in pixels, so all of them must be held.
-// `done`: 1 once pixels are there, which stand for rows.
+// Interlaced rows come in seven passes, each adding pixels, so all rows are kept in memory. `done`:
+// 1 once there are pixels, in place of a row count.
 Status ReadInterlaced(PngReader& reader, const PngLayout& layout, const PictureRecord& picture,
                       PngTarget& target, int32_t& done) {
   const uint64_t rowBytes = png_get_rowbytes(reader.png, reader.info);
@@ -305,7 +305,7 @@ Status ReadInterlaced(PngReader& reader, const PngLayout& layout, const PictureR
   return read ? Status::Ok : reader.Failure();
 }
 
-// How a whole row of the file, free of its filter, becomes the picture's.
+// Converts a complete, unfiltered row of the file.
 using StoreFileRow = void (*)(const uint8_t* source, size_t width, const PngReader& reader,
                               uint8_t* image, uint8_t* alpha);
 
@@ -318,7 +318,7 @@ void CopyPixels(const uint8_t* source, size_t width, const PngReader&, uint8_t* 
   std::memcpy(image, source, (width * kBits + 7) / 8);
 }
 
-// gray or colors, with alpha when the number is even; samples of one or two bytes
+// gray or color, with alpha if the number is even; samples of one or two bytes
 template <size_t kSamples, size_t kBytes>
 void StoreSamples(const uint8_t* source, size_t width, const PngReader&, uint8_t* image,
                   uint8_t* alpha) {
@@ -341,7 +341,7 @@ void StoreDeepGrays(const uint8_t* source, size_t width, const PngReader&, uint8
   for (size_t x = 0; x < width; ++x) image[x] = HighByte(source + 2 * x);
 }
 
-// Colors of a palette with alpha.
+// Palette colors with alpha.
 void StorePaletteAlpha(const uint8_t* source, size_t width, const PngReader& reader, uint8_t* image,
                        uint8_t* alpha) {
   png_bytep opacities = nullptr;
@@ -359,7 +359,7 @@ void StorePaletteAlpha(const uint8_t* source, size_t width, const PngReader& rea
   }
 }
 
-// The forms that are worth a way of their own; the library takes the rest.
+// Pixel formats with a fast path; the others are left to the library.
 StoreFileRow FileRowStore(const PngReader& reader, const PngLayout& layout) {
   struct Form {
     int type, depth;
@@ -392,8 +392,8 @@ StoreFileRow FileRowStore(const PngReader& reader, const PngLayout& layout) {
   return nullptr;
 }
 
-// All rows, inflated at once, in `room` bytes of memory. False, with the target in any state, when
-// the library has to try.
+// Reads all rows, inflated at once, within `room` bytes of memory. False, with the target in an
+// undefined state, if the library must be used.
 bool ReadAtOnce(const PngReader& reader, const PngLayout& layout, const PictureRecord& picture,
                 uint64_t room, PngTarget& target) {
   const StoreFileRow store = FileRowStore(reader, layout);
@@ -408,7 +408,7 @@ bool ReadAtOnce(const PngReader& reader, const PngLayout& layout, const PictureR
     if (row == nullptr) return false;
     store(row, static_cast<size_t>(layout.width), reader, target.image.Row(y).data(),
           target.alpha.Empty() ? nullptr : target.alpha.Row(y).data());
-    if (picture.ReportRow(y) != Status::Ok) return false;  // the library's way ends at once
+    if (picture.ReportRow(y) != Status::Ok) return false;  // the library then stops at once
   }
   return true;
 }
@@ -425,7 +425,7 @@ Status ReadPixels(PngReader& reader, const PngLayout& layout, bool partial,
   RETURN_IF_BAD(NewPackedImage(layout.width, layout.height, &picture.palette, layout.bitsPerPixel, target.image));
   if (withAlpha) RETURN_IF_BAD(NewAlphaPlane(layout.width, layout.height, target.alpha));
   if (!ReadAtOnce(reader, layout, picture, limits.fileMemoryBytes - held, target)) {
-    // Only now: the library takes memory for rows of whatever width the file claims.
+    // Not earlier: the library allocates rows of whatever width the file claims.
     if (!PngGuarded(reader.png, [&] { SetConversions(reader, layout); })) return reader.Failure();
     int32_t rows = 0;
     const Status status = layout.interlaced ? ReadInterlaced(reader, layout, picture, target, rows)
@@ -469,7 +469,7 @@ void AddMetadataLines(const PictureRecord& picture, DetailLines& lines) {
   if (picture.pageCount > 1) lines.AddFormat("       Frames: %d", picture.pageCount);
 }
 
-// The text chunks' keywords and the chunks' number.
+// Keywords of the text chunks, and the number of chunks.
 void AddChunkLines(std::span<const uint8_t> file, DetailLines& lines) {
   PngChunks chunks(file);
   PngChunk chunk;
@@ -487,8 +487,8 @@ void AddChunkLines(std::span<const uint8_t> file, DetailLines& lines) {
   lines.AddFormat("       Chunks: %d, %d of pixels", count, pixels);
 }
 
-// Whether there are texts written by a person, beside those that travel with the picture; programs
-// write the others.
+// Whether there are texts written by a person, besides those that are kept; other keywords are
+// written by programs.
 bool HoldsFurtherTexts(std::span<const uint8_t> file) {
   constexpr std::string_view kOthers[] = {kPngXmpKeyword, "Comment", "Software", "Creation Time"};
   PngChunks chunks(file);
@@ -531,8 +531,8 @@ Status PngInfo(PictureRecord& picture, const ReadRequest& request) {
 
 namespace {
 
-// A copy of a file that ends within pixels: the chunk that is cut short is as long as it goes, so
-// that the decoder gets all of it.
+// A copy of a truncated file with the size of its last chunk adjusted, so that the decoder gets all
+// of it.
 std::vector<uint8_t> Mended(std::span<const uint8_t> file) {
   std::vector<uint8_t> mended;
   PngWalk walk(file);
@@ -553,7 +553,7 @@ std::vector<uint8_t> Mended(std::span<const uint8_t> file) {
   return mended;
 }
 
-// Puts a frame of an animation in the place of the picture.
+// Replaces the picture with a frame of the animation.
 Status ReadFrame(const ReadRequest& request, PictureRecord& picture) {
   picture.image.Free();
   picture.alpha.Free();

@@ -11,8 +11,8 @@
 
 namespace fotomill {
 
-// Portable Network Graphics. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when
-// the file is cut short, MemoryAllocationError (6).
+// Portable Network Graphics. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) if
+// truncated, MemoryAllocationError (6).
 Status PngInfo(PictureRecord& picture, const ReadRequest& request);
 Status PngRead(PictureRecord& picture, const ReadRequest& request);
 // Also ErrorCreatingFile (10), ErrorWritingFile (11).
@@ -23,13 +23,13 @@ Status PngSequenceBegin(const std::string& path, const SequenceFacts& facts,
                         const WriteOptions& options, SequencePointer& sequence);
 Status PngDetails(PictureRecord& picture);
 
-// The same for a file in memory, as containers hold them. Statuses as above.
+// As above, for a file in memory, such as inside a container. Statuses as above.
 Status DescribePng(std::span<const uint8_t> file, const ReadOptions& options,
                    PictureRecord& picture);
-// A PNG file in memory: facts and pixels at once; `partial` as in a read request.
+// Reads header and pixels of a PNG file in memory; `partial` as in a read request.
 Status DecodePng(std::span<const uint8_t> file, const ReadOptions& options, PictureRecord& picture,
                  bool partial = false);
-// Appends a PNG file of the picture's pixels, without metadata, to `out`.
+// Appends the picture's pixels as a PNG file without metadata to `out`.
 Status EncodePng(const PictureRecord& picture, const EncodeOptions& options, ByteWriter& out);
 
 }  // namespace fotomill

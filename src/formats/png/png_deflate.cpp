@@ -21,12 +21,12 @@ namespace fotomill {
 
 namespace {
 
-// of filtered rows: large enough to cost nothing, small enough to share out
+// filtered bytes per band: large enough for good compression, small enough to distribute
 constexpr uint64_t kBandBytes = uint64_t{4} << 20;
 constexpr unsigned kMostThreads = 16;
-// The best level searches for the cheapest coding, which is 2 to 6 % smaller than zlib's best, in
-// every other band: that makes up for the bands between, which are up to 1 % larger than zlib's,
-// and takes well below half of its time.
+// Every other band uses the best level, which searches for the optimal coding, 2 to 6 % smaller
+// than zlib's best: that compensates for the bands in between, which are up to 1 % larger than
+// zlib's, and takes well below half the time.
 constexpr int kSearchingLevel = 10;
 
 struct CompressorDeleter {
@@ -38,23 +38,23 @@ using Compressor = std::unique_ptr<libdeflate_compressor, CompressorDeleter>;
 
 struct Band {
   platform::MemoryBlock deflated;
-  uint64_t size = 0;     // of the deflated bytes
-  uint64_t rawSize = 0;  // of what they hold
-  uint32_t adler = 1;    // of that
+  uint64_t size = 0;     // of the deflated data
+  uint64_t rawSize = 0;  // uncompressed
+  uint32_t adler = 1;    // of the uncompressed data
   Status status = Status::Ok;
   bool done = false;
 };
 
-// Makes the last block of a deflate stream an inner one and appends an empty stored block, which
-// ends at a byte, so that another stream can follow. Where the block begins, an inflater says that
-// stops at each one.
+// Makes the last block of a deflate stream non-final and appends an empty stored block, which is
+// byte-aligned, so that another stream can follow. The start of the last block is found by
+// inflating block by block.
 bool OpenEnd(const Band& band, uint8_t* stream, uint64_t& size, std::vector<uint8_t>& discarded) {
   constexpr int kBitsLeft = 63, kInLastBlock = 64, kAtBlockEnd = 128;
   z_stream inflater = {};
   if (inflateInit2(&inflater, -MAX_WBITS) != Z_OK) return false;
   inflater.next_in = stream;
   inflater.avail_in = static_cast<uInt>(size);
-  uint64_t lastBlock = 0, end = 0;  // bits in front of it, and of what follows it
+  uint64_t lastBlock = 0, end = 0;  // bit offsets before and after it
   int result = Z_OK;
   while (result == Z_OK) {
     inflater.next_out = discarded.data();
@@ -68,7 +68,7 @@ bool OpenEnd(const Band& band, uint8_t* stream, uint64_t& size, std::vector<uint
   inflateEnd(&inflater);
   if (result != Z_STREAM_END || end == 0 || inflater.total_out != band.rawSize) return false;
   stream[lastBlock / 8] = static_cast<uint8_t>(stream[lastBlock / 8] & ~(1u << lastBlock % 8));
-  // Three zero bits, the rest of the byte, then the length 0 and its complement.
+  // Three zero bits, padding to a byte, then length 0 and its complement.
   size = (end + 3 + 7) / 8;
   if (end % 8 != 0) stream[end / 8] = static_cast<uint8_t>(stream[end / 8] & ((1u << end % 8) - 1));
   if (size > (end + 7) / 8) stream[size - 1] = 0;
@@ -117,7 +117,7 @@ class BandMaker {
 
  private:
   bool Filter(int32_t first, int32_t last, uint8_t* target) const {
-    platform::MemoryBlock pair;  // the row in work and the one above
+    platform::MemoryBlock pair;  // the current row and the one above
     if (!pair.Allocate(2 * rows_.rowBytes)) return false;
     uint8_t* row = pair.Data();
     uint8_t* above = row + rows_.rowBytes;
@@ -142,7 +142,7 @@ class BandMaker {
   int32_t bandRows_ = 1;
 };
 
-// Bands made ahead by threads that have nothing else to do, handed out in order.
+// Bands compressed ahead of time by idle threads, delivered in order.
 class BandQueue {
  public:
   BandQueue(const BandMaker& maker, unsigned threads)
@@ -159,11 +159,11 @@ class BandQueue {
   BandQueue(const BandQueue&) = delete;
   BandQueue& operator=(const BandQueue&) = delete;
 
-  // Band `index`, made here if no thread has begun it; valid until the next call. Bands
-  // are taken in order, each once.
+  // Band `index`, compressed here if no thread has started it; valid until the next call. Must be
+  // called in order, once for each band.
   Band& Take(int32_t index) {
     std::unique_lock lock(mutex_);
-    if (index > 0) Slot(index - 1) = Band();  // its slot is free for another
+    if (index > 0) Slot(index - 1) = Band();  // frees its slot
     taken_ = index;
     changed_.notify_all();
     while (!Slot(index).done) {
@@ -174,7 +174,7 @@ class BandQueue {
 
  private:
   Band& Slot(int32_t index) { return slots_[static_cast<size_t>(index) % slots_.size()]; }
-  // Begins the next band if there is a slot for it; false when there is nothing to begin. Unlocked
+  // Starts the next band if there is a free slot; false if there is nothing to start. Unlocked
   // while it works.
   bool MakeNext(std::unique_lock<std::mutex>& lock) {
     if (begun_ >= maker_.Bands() || begun_ >= taken_ + static_cast<int32_t>(slots_.size()))
@@ -205,10 +205,10 @@ class BandQueue {
   bool stopped_ = false;
   std::mutex mutex_;
   std::condition_variable changed_;
-  Helpers helpers_;  // last: they use the rest
+  Helpers helpers_;  // last: uses the other members
 };
 
-// One chunk, given in parts.
+// Writes a chunk in parts.
 void WriteChunk(ByteWriter& out, std::span<const uint8_t> head, std::span<const uint8_t> body,
                 std::span<const uint8_t> tail) {
   constexpr uint8_t kType[] = {'I', 'D', 'A', 'T'};
@@ -227,7 +227,7 @@ void WriteChunk(ByteWriter& out, std::span<const uint8_t> head, std::span<const 
 
 Status WritePngPixels(const PngRows& rows, bool filtered, int32_t level, ByteWriter& out,
                       const std::function<Status(int32_t)>& report) {
-  // a band takes several rows' room
+  // a band buffers several rows
   if (rows.rowBytes > limits.packedBlockBytes / 8) return Status::MemoryAllocationError;
   const BandMaker maker(rows, filtered, level);
   const int32_t bands = maker.Bands();

@@ -17,7 +17,7 @@ inline uint8_t Nearest(int left, int above, int corner) {
   return static_cast<uint8_t>(fromAbove <= fromCorner ? above : corner);
 }
 
-// The bytes of a pixel at a time, so that those to the left stay in registers.
+// Processes a whole pixel at a time, so that the previous one stays in a register.
 template <size_t kBytes>
 void UndoSub(uint8_t* row, size_t size) {
   uint8_t left[kBytes] = {};
@@ -60,11 +60,10 @@ void UndoOf(PngFilter filter, uint8_t* row, const uint8_t* above, size_t size) {
   if (filter == PngFilter::Paeth) UndoPaeth<kBytes>(row, above, size);
 }
 
-// Each writes the differences of a row from something and answers the sum of how far they are from
-// 0, as signed bytes.
+// Each writes a filtered row and returns the sum of the absolute values, as signed bytes.
 struct FilterKernels {
   uint64_t (*none)(const uint8_t* row, size_t size);
-  // also serves for Up
+  // also used for Up
   uint64_t (*sub)(const uint8_t* row, const uint8_t* left, size_t size, uint8_t* target);
   uint64_t (*average)(const uint8_t* row, const uint8_t* left, const uint8_t* above, size_t size,
                       uint8_t* target);
@@ -87,8 +86,8 @@ inline __m128i LoadPixel(const uint8_t* source) {
   return _mm_cvtepu8_epi16(_mm_cvtsi32_si128(bytes));
 }
 
-// Pixels of 3 or 4 bytes, one 16-bit lane for each byte. A pixel is stored with what is behind
-// it, which is loaded before.
+// Pixels of 3 or 4 bytes, one 16-bit lane per byte. Stores more than one pixel; the bytes after it
+// are loaded before.
 template <size_t kBytes>
 void UndoPaeth(uint8_t* row, const uint8_t* above, size_t size) {
   __m128i left = _mm_setzero_si128(), corner = left, next = LoadPixel(row);
@@ -160,8 +159,8 @@ void PngFilterChooser::FilterRow(const uint8_t* row, const uint8_t* above, uint8
     filter = candidate;
     tried_.swap(best_);
   };
-  // The first pixel has none to its left: there Sub is the value, Average half of what is above,
-  // Paeth what is above.
+  // The first pixel has no left neighbor: there Sub is the value itself, Average uses half of the
+  // byte above, and Paeth the byte above.
   const auto sumHead = [&](auto predict) {
     uint64_t sum = 0;
     for (size_t i = 0; i < head; ++i) {

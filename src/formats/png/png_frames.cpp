@@ -1,13 +1,13 @@
-// Frames of an animated PNG. Each is handed to the decoder as a file of its own: the head with the
-// frame's size, the palette and what else is in front of the pixels, and the frame's data.
+// Frames of an animated PNG. Each is passed to the decoder as a separate file: a header with the
+// frame's size, the palette and other chunks that precede the pixels, and the frame's data.
 //
-//   acTL  frames, plays (4 bytes each, 0: for ever)
+//   acTL  frames, plays (4 bytes each, 0: endless)
 //   fcTL  sequence number, width, height, x, y (4 bytes each), delay as a fraction of a second
-//         (2 bytes each, a denominator of 0 stands for 100), disposal (0 keep, 1 clear, 2 as
-//         before), blending (0 replace, 1 over)
+//         (2 bytes each, denominator 0 means 100), disposal (0 keep, 1 clear, 2 restore previous),
+//         blending (0 replace, 1 over)
 //   fdAT  sequence number (4 bytes), then data as in IDAT
 //
-// Pixels in front of the first fcTL belong to no frame.
+// Pixels before the first fcTL belong to no frame.
 // Source: W3C, "Portable Network Graphics (PNG) Specification (Third Edition)", 2025,
 // section 11.3.6.
 #include <libdeflate.h>
@@ -94,9 +94,8 @@ class PngAnimation final : public Animation {
   }
 
  private:
-  // Takes the chunks in front of the pixels, and the frames' places; without frames the picture is
-  // the only one. Where the file ends before its last frame, one without data stands for those that
-  // are missing.
+  // Collects the chunks before the pixels, and the frames; without frames, the still picture is the
+  // only one. If the file is truncated, one frame without data stands for the missing ones.
   void Collect(size_t frames, bool partial) {
     PngChunks chunks(file_.Bytes());
     PngFrame still{.width = width_, .height = height_};
@@ -132,7 +131,7 @@ class PngAnimation final : public Animation {
     rounds_ = plays_;
   }
 
-  // What the decoder needs besides; profiles and texts belong to the file.
+  // Keeps other chunks the decoder needs; profiles and texts belong to the file.
   void KeepHead(const PngChunk& chunk) {
     constexpr std::string_view kTypes[] = {"IHDR", "PLTE", "tRNS"};
     const auto* const type = std::ranges::find(kTypes, chunk.type);
@@ -151,7 +150,7 @@ class PngAnimation final : public Animation {
     picture.stop = stop_;
     RETURN_IF_BAD(DecodePng(FileOf(frame), options_, picture));
     RETURN_IF_BAD(PromoteToAlpha(picture));
-    // the first frame has nothing to go back to
+    // the first frame has nothing to restore
     if (frame.disposal == kAsBefore && index > 0) RETURN_IF_BAD(KeepBeneath(frame));
     for (int32_t y = 0; y < frame.height; ++y) DrawRow(frame, picture, y);
     return file_.Intact() ? Status::Ok : Status::FileReadError;
@@ -195,7 +194,7 @@ class PngAnimation final : public Animation {
     }
   }
 
-  // One pixel over another: section 13.16 of the specification.
+  // Composites one pixel over another: section 13.16 of the specification.
   static void Blend(const uint8_t* color, uint32_t alpha, uint8_t* target, uint8_t& opacity) {
     const uint32_t beneath = opacity * (255 - alpha), whole = 255 * alpha + beneath;
     for (size_t i = 0; i < 3; ++i) {
@@ -240,10 +239,10 @@ class PngAnimation final : public Animation {
   StopToken stop_;
   int32_t width_ = 0, height_ = 0;
   int32_t plays_ = 1;
-  std::vector<uint8_t> head_;      // chunks in front of the pixels, the size first
-  bool kept_[3] = {};              // which of them there are; each comes once
+  std::vector<uint8_t> head_;      // chunks before the pixels, the header first
+  bool kept_[3] = {};              // which chunks were found; each is used once
   std::vector<PngFrame> frames_;   // views into the file
-  platform::MemoryBlock beneath_;  // what was there before the last frame, if it goes back to that
+  platform::MemoryBlock beneath_;  // the area below the last frame, if it must be restored
 };
 
 }  // namespace

@@ -22,7 +22,7 @@ struct DecompressorDeleter {
   }
 };
 
-// The data of all pixel chunks, which must be whole and follow each other.
+// The data of all pixel chunks, which must be complete and consecutive.
 bool FindPixelChunks(std::span<const uint8_t> file, std::vector<std::span<const uint8_t>>& parts,
                      uint64_t& size) {
   PngChunks chunks(file);
@@ -42,7 +42,7 @@ bool FindPixelChunks(std::span<const uint8_t> file, std::vector<std::span<const 
   return false;
 }
 
-// The parts as one span; no copy is made of a single part.
+// Concatenates the parts; a single part is not copied.
 bool Join(const std::vector<std::span<const uint8_t>>& parts, uint64_t size,
           platform::MemoryBlock& copy, std::span<const uint8_t>& joined) {
   joined = parts[0];
@@ -61,13 +61,13 @@ bool PngPixels::Inflate(std::span<const uint8_t> file, uint64_t rowBytes, uint32
   rowBytes_ = rowBytes;
   pixelBytes_ = std::max(1u, pixelBits / 8);
   const auto rows = static_cast<uint64_t>(height);
-  // of what a picture may take, since that and the deflated data are held as well
+  // part of the memory limit, as the picture and the deflated data are in memory, too
   constexpr uint64_t kShare = 4;
   if (rowBytes == 0 || rowBytes + 1 > limits.packedBlockBytes / kShare / rows) return false;
   const uint64_t size = (rowBytes + 1) * rows;
   std::vector<std::span<const uint8_t>> parts;
   uint64_t packed = 0;
-  constexpr uint64_t kBestRatio = 1032;  // of deflate
+  constexpr uint64_t kBestRatio = 1032;  // maximum deflate compression
   if (!FindPixelChunks(file, parts, packed) || size / kBestRatio > packed) return false;
   if (size + 2 * rowBytes > room || (parts.size() > 1 && packed > room - size - 2 * rowBytes))
     return false;

@@ -7,16 +7,16 @@
 
 namespace fotomill {
 
-// The rows of a PNG that is not interlaced, inflated all at once and freed of their filters one by
-// one.
+// The rows of a non-interlaced PNG, inflated
+// at once and unfiltered one by one.
 class PngPixels {
  public:
-  // Inflates the pixels of a file whose rows have `rowBytes` and whose pixels have `pixelBits`.
-  // False when that is not possible for whatever reason, damage included, or takes more than `room`
-  // bytes: another decoder must try.
+  // Inflates the pixels of a file with `rowBytes` per row and `pixelBits` per pixel. False if that
+  // fails for any reason, including damaged data, or takes more than `room` bytes: another decoder
+  // must try.
   [[nodiscard]] bool Inflate(std::span<const uint8_t> file, uint64_t rowBytes, uint32_t pixelBits,
                              int32_t height, uint64_t room);
-  // The next row, from the top; null when its filter does not exist.
+  // The next row, top first; null if its filter is invalid.
   const uint8_t* NextRow();
 
  private:

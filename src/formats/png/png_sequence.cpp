@@ -1,7 +1,7 @@
-// The writer of animated PNGs. Each frame is the part of the canvas that differs from the frame
-// before, put there without blending; its chunks come from the writer of still pictures, by way of
-// a temporary file. The first frame is also the picture that other programs show. png_frames.cpp
-// tells how the chunks are laid out.
+// The writer of animated PNGs. Each frame is the part of the canvas that differs from the previous
+// frame, stored without blending; its chunks come from the writer of still pictures, by way of a
+// temporary file. The first frame is also the still picture shown by other programs. For the chunk
+// layouts see png_frames.cpp.
 #include <libdeflate.h>
 
 #include <algorithm>
@@ -25,7 +25,7 @@ namespace fotomill {
 
 namespace {
 
-constexpr int32_t kMostTicks = UINT16_MAX;  // of a delay
+constexpr int32_t kMostTicks = UINT16_MAX;  // maximum delay
 constexpr int32_t kThousandths = 1000, kSeconds = 1;
 
 class ChunkData {
@@ -59,7 +59,7 @@ class PngSequence final : public SequenceWriter {
   }
 
   Status Add(PictureRecord& picture, int32_t delayMs) override {
-    // all frames have the same form
+    // all frames must have the same pixel format
     RETURN_IF_BAD(PromoteToAlpha(picture));
     const bool first = screen_.image.Empty();
     const int32_t width = picture.image.Width(), height = picture.image.Height();
@@ -97,7 +97,7 @@ class PngSequence final : public SequenceWriter {
     if (!file.Open(working.Path())) return Status::FileOpenError;
     PngChunks chunks(file.Bytes());
     if (first) out_.Text(kPngSignature);
-    bool controlled = false;  // the frame's control chunk is written
+    bool controlled = false;  // the frame's control chunk was written
     for (PngChunk chunk; chunks.Next(chunk);) {
       const bool pixels = chunk.type == "IDAT";
       if (pixels && !std::exchange(controlled, true)) WriteControl(area, delayMs);
@@ -132,16 +132,16 @@ class PngSequence final : public SequenceWriter {
       chunk.Put(static_cast<uint32_t>(value), 4);
     chunk.Put(static_cast<uint32_t>(fits ? delay : std::min(delay / 1000, kMostTicks)), 2);
     chunk.Put(static_cast<uint32_t>(fits ? kThousandths : kSeconds), 2);
-    chunk.Put(0, 2);  // it stays, and takes the place of what was there
+    chunk.Put(0, 2);  // disposal: keep, blending: replace
     chunk.Write(out_);
   }
 
   const SequenceFacts facts_;
   const WriteOptions options_;
   ByteWriter out_;
-  Canvas screen_;  // as the frames written so far leave it
+  Canvas screen_;  // after the frames written so far
   size_t done_ = 0;
-  uint32_t sequence_ = 0;  // of the next chunk that has a number
+  uint32_t sequence_ = 0;  // number of the next sequenced chunk
 };
 
 }  // namespace

@@ -23,7 +23,7 @@ struct DecompressorDeleter {
   }
 };
 
-// Tries ever larger buffers: the length of the text is not stored.
+// Retries with larger buffers, as the length of the text is not stored.
 std::vector<uint8_t> Inflated(std::span<const uint8_t> data, uint64_t most) {
   constexpr uint64_t kFirst = 16 * 1024;
   const std::unique_ptr<libdeflate_decompressor, DecompressorDeleter> decompressor(
@@ -44,7 +44,7 @@ std::vector<uint8_t> Inflated(std::span<const uint8_t> data, uint64_t most) {
   }
 }
 
-// What follows the first zero byte; empty without one.
+// The bytes after the first NUL; empty if there is none.
 std::span<const uint8_t> BehindZero(std::span<const uint8_t> data) {
   const auto zero = std::ranges::find(data, uint8_t{0});
   return zero == data.end() ? std::span<const uint8_t>()

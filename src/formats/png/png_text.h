@@ -10,8 +10,8 @@ namespace fotomill {
 
 // The keyword of a tEXt, zTXt or iTXt chunk.
 std::string_view PngTextKeyword(const PngChunk& chunk);
-// Its text as it is stored, inflated where it is deflated; empty where it is damaged or longer than
-// `most` bytes.
+// Its text as stored, inflated if necessary; empty
+// if it is damaged or longer than `most` bytes.
 std::vector<uint8_t> PngTextOf(const PngChunk& chunk, uint64_t most);
 
 }  // namespace fotomill

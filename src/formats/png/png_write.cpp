@@ -1,6 +1,6 @@
 // The PNG writer keeps the depth: palettes of 1, 4 and 8 bits (grays as gray), RGB, or RGBA with an
-// alpha plane. libpng writes everything in front of the pixels, png_deflate.cpp the pixels,
-// compressed as PngCompression says.
+// alpha plane. libpng writes everything before the pixels, png_deflate.cpp the pixels, compressed
+// with PngCompression.
 #include <algorithm>
 #include <cmath>
 #include <cstring>
@@ -61,7 +61,7 @@ void SetMetadata(const PngWriter& writer, const PictureRecord& picture, bool kee
                  PNG_RESOLUTION_METER);
   }
   if (!metadata.icc.empty()) {
-    png_set_benign_errors(writer.png, 1);  // an odd profile is left out, not the picture
+    png_set_benign_errors(writer.png, 1);  // an invalid profile is dropped, not the picture
     png_set_iCCP(writer.png, writer.info, "ICC profile", PNG_COMPRESSION_TYPE_BASE,
                  metadata.icc.data(), static_cast<png_uint_32>(metadata.icc.size()));
     if (png_get_valid(writer.png, writer.info, PNG_INFO_iCCP) == 0) lost |= kLostIcc;
@@ -101,8 +101,8 @@ void SetHeader(const PngWriter& writer, const PictureRecord& picture) {
   }
 }
 
-// A row of red, green, blue, alpha. The colors are put at its end first and go to their places from
-// the left on.
+// A row of red, green, blue, alpha. The colors are first copied to its end and then spread out from
+// the left.
 void MergeRow(const BgrRows& colors, const PackedImage& alpha, int32_t y, uint8_t* target) {
   const auto width = static_cast<size_t>(alpha.Width());
   const uint8_t* source = target + width;
@@ -135,7 +135,7 @@ Status WritePixels(const PictureRecord& picture, int32_t compression, ByteWriter
       std::memcpy(row, image.Row(y).data(), rows.rowBytes);
     }
   };
-  // palettes and pixels within a byte have no neighbours to differ from
+  // filters do not help with palettes and packed pixels
   const int type = ColorType(picture);
   const bool filtered = type != PNG_COLOR_TYPE_PALETTE && DepthOf(picture) == 8;
   return WritePngPixels(rows, filtered, compression, out,
@@ -143,13 +143,13 @@ Status WritePixels(const PictureRecord& picture, int32_t compression, ByteWriter
 }
 
 void WriteEnd(ByteWriter& out) {
-  constexpr uint32_t kCrc = 0xAE426082;  // of the four letters
+  constexpr uint32_t kCrc = 0xAE426082;  // of the chunk type
   out.Be32(0);
   out.Text("IEND");
   out.Be32(kCrc);
 }
 
-// `keep`: whether metadata and comment go along; `lost`: what of them could not.
+// `keep`: whether to write metadata and comment; `lost`: what could not be written.
 Status WriteAll(PngWriter& writer, const PictureRecord& picture, const EncodeOptions& options,
                 bool keep, uint8_t& lost) {
   const std::string xmp(picture.metadata.xmp.begin(), picture.metadata.xmp.end());

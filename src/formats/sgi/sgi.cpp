@@ -2,23 +2,26 @@
 //
 //   offset size  field
 //        0    2  magic number 474
-//        2    1  storage: 0 plain, 1 run lengths
-//        3    1  bytes of a sample: 1 or 2
+//        2    1  storage: 0 uncompressed, 1 run-length coded
+//        3    1  bytes per sample: 1 or 2
 //        4    2  dimensions: 1 a single row, 2 one channel, 3 several
 //        6    6  width, height, channels
-//       12    8  least and greatest sample, not used
-//       20    4  nothing
+//       12    8  minimum and maximum sample, not used
+//       20    4  unused
 //       24   80  name
-//      104    4  color map: 0 none; 1 three-bit colors and 2 a map elsewhere, both obsolete; 3 the
-//      file is a map 108  404  nothing 512       plain: the rows of the first channel from the
-//      bottom up, then those of the next 512       run lengths: the offset of each such row (4
-//      bytes each), then the length of each, then the rows' code
+//      104    4  color map: 0 none; 1 three-bit colors and 2 a separate map, both obsolete; 3 the
+//                file is a map
+//      108  404  unused
+//      512       uncompressed: the rows of the first channel, bottom row first, then those of the
+//                next
+//      512       run-length coded: the offset of each such row (4 bytes each), then the size of
+//                each, then the coded rows
 //
-// Channels are gray, gray and alpha, RGB, or RGB and alpha; more are passed over. Samples of two
-// bytes come down to one, rounded. Rows may share their code and be in any order.
+// Channels are gray, gray and alpha, RGB, or RGB and alpha; additional ones are ignored. 16-bit
+// samples are rounded to 8. Rows may share data and be in any order.
 //
-// The writer stores run lengths of one byte a sample: pictures of the gray ramp in one channel,
-// everything else in three, and a channel of alpha where the picture has some. Source: P. Haeberli,
+// The writer uses run-length coding with 8-bit samples: pictures with the gray ramp in one channel,
+// everything else in three, plus an alpha channel if the picture has alpha. Source: P. Haeberli,
 // "The SGI Image File Format, Version 1.00" (Silicon Graphics).
 #include "formats/sgi/sgi.h"
 
@@ -52,7 +55,7 @@ struct SgiHeader {
   uint64_t PlainRowSize() const { return static_cast<uint64_t>(width) * sampleSize; }
 };
 
-// Ok; FileReadError for a short header, DamagedFile for what no such file can say,
+// Ok; FileReadError for a truncated header, DamagedFile for invalid values,
 // UnsupportedFormat, NoImages.
 Status ParseHeader(std::span<const uint8_t> file, SgiHeader& header) {
   ByteReader bytes(file);
@@ -96,10 +99,10 @@ void DescribePicture(const SgiHeader& header, PictureRecord& picture) {
   }
 }
 
-// File offsets of the samples of each row of each channel.
+// File offset and size of each row of each channel.
 class RowTable {
  public:
-  // FileReadError when the file is too short for what it holds.
+  // FileReadError if the file is too short.
   Status Open(std::span<const uint8_t> file, const SgiHeader& header) {
     file_ = file;
     header_ = &header;
@@ -108,8 +111,7 @@ class RowTable {
     return file.size() - kHeaderSize < least ? Status::FileReadError : Status::Ok;
   }
 
-  // Decodes row `y`, counted from the bottom, of a channel. FileReadError when its data are not all
-  // there.
+  // Decodes row `y`, from the bottom, of a channel. FileReadError if its data are truncated.
   Status Decode(uint64_t channel, int32_t y, std::span<uint8_t> row) const {
     const uint64_t index =
         channel * static_cast<uint64_t>(header_->height) + static_cast<uint64_t>(y);
@@ -167,7 +169,7 @@ Status ReadRows(const RowTable& table, const SgiHeader& header, const PictureRec
   return Status::Ok;
 }
 
-// The channels that a picture is stored in.
+// Number of channels to store for a picture.
 uint16_t ChannelsFor(const PictureRecord& picture) {
   const bool gray = picture.image.Bits() == 8 && picture.palette == GrayRamp();
   return static_cast<uint16_t>((gray ? 1 : 3) + (picture.alpha.Empty() ? 0 : 1));
@@ -186,7 +188,7 @@ void WriteHeader(ByteWriter& out, const PackedImage& image, uint16_t channels) {
   out.Zeros(kHeaderSize - 20);
 }
 
-// One channel of row `y` from the bottom: its own bytes of the picture, or gathered in `room`.
+// One channel of row `y`, from the bottom: a view into the picture, or copied to `room`.
 class ChannelRows {
  public:
   ChannelRows(const PictureRecord& picture, uint16_t channels)
@@ -213,7 +215,7 @@ class ChannelRows {
 
  private:
   const PictureRecord& picture_;
-  const uint16_t colors_;  // channels before that of alpha
+  const uint16_t colors_;  // channels before alpha
   std::vector<uint8_t> room_;
 };
 
@@ -221,7 +223,7 @@ void PutBe32(std::vector<uint8_t>& table, size_t index, uint64_t value) {
   for (size_t i = 0; i < 4; ++i) table[4 * index + i] = static_cast<uint8_t>(value >> (24 - 8 * i));
 }
 
-// UnsuitableImage when an offset does not fit its field.
+// UnsuitableImage if an offset does not fit its field.
 Status WriteRows(ByteWriter& out, const PictureRecord& picture, uint16_t channels) {
   const int32_t height = picture.image.Height();
   const auto width = static_cast<size_t>(picture.image.Width());

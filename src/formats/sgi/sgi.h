@@ -6,9 +6,9 @@
 
 namespace fotomill {
 
-// Silicon Graphics images. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when
-// data are cut short, MemoryAllocationError (6), UnsupportedFormat (8) for the obsolete color maps,
-// NoImages (20) for a file that is a color map.
+// Silicon Graphics images. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) if
+// truncated, MemoryAllocationError (6), UnsupportedFormat (8) for the obsolete color maps, NoImages
+// (20) for a file that is a color map.
 Status SgiInfo(PictureRecord& picture, const ReadRequest& request);
 Status SgiRead(PictureRecord& picture, const ReadRequest& request);
 // Also UnsuitableImage (13) for more than 4 GiB of data, ErrorCreatingFile (10), ErrorWritingFile

@@ -8,10 +8,10 @@ namespace fotomill {
 namespace {
 
 constexpr uint8_t kLiteral = 0x80, kCount = 0x7f;
-constexpr size_t kMostInToken = 126;  // as other writers have it; the code allows 127
-constexpr size_t kShortestRun = 3;    // a shorter one saves nothing
+constexpr size_t kMostInToken = 126;  // like other writers; the format allows 127
+constexpr size_t kShortestRun = 3;    // shorter runs save nothing
 
-// Where the next run of kShortestRun equal samples begins; the end when there is none.
+// Start of the next run of kShortestRun equal samples; the end if there is none.
 const uint8_t* NextRun(const uint8_t* at, const uint8_t* end) {
   for (; end - at >= static_cast<ptrdiff_t>(kShortestRun); ++at) {
     if (at[0] == at[1] && at[1] == at[2]) return at;

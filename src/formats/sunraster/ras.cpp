@@ -3,22 +3,22 @@
 //   offset size  field
 //        0    4  magic number 0x59A66A95
 //        4    8  width, height
-//       12    4  bits of a pixel: 1, 8, 24 or 32
-//       16    4  bytes of the pixels, 0 in old files
+//       12    4  bits per pixel: 1, 8, 24 or 32
+//       16    4  size of the pixels, 0 in old files
 //       20    4  type: 0 old, 1 standard, 2 byte-encoded, 3 RGB
-//       24    4  type of the color map: 0 none, 1 RGB planes, 2 raw
-//       28    4  bytes of the color map
+//       24    4  color map type: 0 none, 1 RGB planes, 2 raw
+//       28    4  size of the color map
 //       32       color map: all red values, all green ones, all blue ones
-//        .       rows from the top, each padded to 16 bits
+//        .       rows, top first, each padded to 16 bits
 //
-// Pixels of 24 bits are blue, green, red, in files of type RGB red, green, blue; of 32 bits there
-// is an unused byte in front. Without a map, a bit that is set is black, and 8 bits are gray. In
-// byte-encoded pixels 128 comes before a count n and a value that comes n + 1 times; a count of 0
-// has no value and means 128 itself. Runs go on from row to row.
+// 24-bit pixels are blue, green, red, in files of type RGB red, green, blue; 32-bit ones have an
+// unused byte in front. Without a map, set bits are black, and 8 bits are gray. In byte-encoded
+// pixels, 128 precedes a count n and a value that is repeated n + 1 times; a count of 0 has no
+// value and means a literal 128. Runs may continue across rows.
 //
-// The writer makes standard files without runs, which every reader takes: black and white in 1 bit,
-// other palettes in 8 bits with a map (grays without one), everything else in 24 bits. Source: Sun
-// Microsystems, SunOS Reference Manual, rasterfile(5).
+// The writer creates standard files without runs, which every reader supports: black and white in 1
+// bit, other palettes in 8 bits with a map (grays without one), everything else in 24 bits. Source:
+// Sun Microsystems, SunOS Reference Manual, rasterfile(5).
 #include "formats/sunraster/ras.h"
 
 #include <algorithm>
@@ -35,7 +35,7 @@ namespace fotomill {
 namespace {
 
 constexpr uint64_t kHeaderSize = 32;
-constexpr uint64_t kHeadSize = kHeaderSize + 768;  // with the largest map that counts
+constexpr uint64_t kHeadSize = kHeaderSize + 768;  // including the largest map in use
 constexpr uint32_t kMagic = 0x59A66A95;
 constexpr uint32_t kOld = 0, kStandard = 1, kByteEncoded = 2, kRgb = 3;
 constexpr uint32_t kNoMap = 0, kRgbMap = 1, kRawMap = 2;
@@ -51,8 +51,7 @@ struct RasHeader {
   uint64_t PixelOffset() const { return kHeaderSize + mapSize; }
 };
 
-// Ok; FileReadError for a short header, DamagedFile for what no such file can say,
-// UnsupportedFormat.
+// Ok; FileReadError for a truncated header, DamagedFile for invalid values, UnsupportedFormat.
 Status ParseHeader(std::span<const uint8_t> file, RasHeader& header) {
   ByteReader bytes(file);
   const uint32_t magic = bytes.Be32();
@@ -74,7 +73,7 @@ Status ParseHeader(std::span<const uint8_t> file, RasHeader& header) {
   return depthKnown && header.type <= kRgb ? Status::Ok : Status::UnsupportedFormat;
 }
 
-// The colors of the map, or what pixels mean without one.
+// The colors of the map, or the default colors without one.
 void ReadPalette(std::span<const uint8_t> file, const RasHeader& header, Palette& palette) {
   MakeDefaultPalette(&palette, nullptr, header.bits > 8 ? kDisplayPalette : kBlackAndWhitePalette);
   if (header.bits > 8) return;
@@ -103,7 +102,7 @@ Status DescribePicture(const platform::FileView& file, const ReadRequest&, RasHe
   return Status::Ok;
 }
 
-// The bytes of one row after another, whether encoded or not.
+// Delivers the decoded bytes row by row.
 class RowSource {
  public:
   RowSource(std::span<const uint8_t> pixels, const RasHeader& header)
@@ -112,7 +111,7 @@ class RowSource {
         size_(header.RowSize()),
         row_(encoded_ ? size_ : 0) {}
 
-  // The next row; empty when the data are cut short. Valid until the next call.
+  // The next row; empty if the data are truncated. Valid until the next call.
   std::span<const uint8_t> Next() {
     if (!encoded_) return bytes_.Take(size_);
     for (uint64_t filled = 0; filled < size_;) {
@@ -127,7 +126,7 @@ class RowSource {
   uint64_t Position() const { return bytes_.Position(); }
 
  private:
-  // Copies bytes up to the next escape, which becomes a run. False at the end of the data.
+  // Copies literals up to the next escape, which starts a run. False at the end of the data.
   bool TakePlain(uint64_t& filled) {
     const auto ahead = bytes_.Peek(size_ - filled);
     const auto escape = std::find(ahead.begin(), ahead.end(), kEscape);
@@ -146,11 +145,11 @@ class RowSource {
   const bool encoded_;
   const uint64_t size_;
   std::vector<uint8_t> row_;
-  uint64_t run_ = 0;  // bytes of a run that are still to come
+  uint64_t run_ = 0;  // remaining bytes of a run
   uint8_t value_ = 0;
 };
 
-// Turns the bytes of a row into the picture's.
+// Converts the bytes of a row to the picture's.
 using PutRow = void (*)(const uint8_t* source, size_t width, uint8_t* row);
 
 void CopyBits(const uint8_t* source, size_t width, uint8_t* row) {
@@ -187,7 +186,7 @@ Status Decode(platform::FileView& file, const RasHeader& header, const PictureRe
               PackedImage& image) {
   if (file.FileSize() < header.PixelOffset()) return Status::FileReadError;
   const auto pixels = file.Bytes().subspan(header.PixelOffset());
-  // A run makes at most 256 bytes of three.
+  // A run expands three bytes to at most 256.
   const uint64_t least = header.RowSize() * header.height / (header.type == kByteEncoded ? 86 : 1);
   if (pixels.size() < least) return Status::FileReadError;
   RETURN_IF_BAD(
@@ -204,11 +203,11 @@ Status Decode(platform::FileView& file, const RasHeader& header, const PictureRe
   return Status::Ok;
 }
 
-// What the writer stores for a picture.
+// File layout for a picture to write.
 struct RasLayout {
   uint32_t bits = 24;
   bool map = false;
-  bool invert = false;  // pixels of 1 bit, whose set bits are white
+  bool invert = false;  // 1-bit pixels whose set bits are white
 };
 
 RasLayout ChooseLayout(const PictureRecord& picture) {

@@ -6,8 +6,8 @@
 
 namespace fotomill {
 
-// Sun rasters. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when data are cut
-// short, MemoryAllocationError (6), UnsupportedFormat (8) for types and depths that are not read.
+// Sun rasters. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) if truncated,
+// MemoryAllocationError (6), UnsupportedFormat (8) for unsupported types and depths.
 Status RasInfo(PictureRecord& picture, const ReadRequest& request);
 Status RasRead(PictureRecord& picture, const ReadRequest& request);
 // Also UnsuitableImage (13) for more than 4 GiB of pixels, ErrorCreatingFile (10), ErrorWritingFile

@@ -1,31 +1,36 @@
 // Truevision Targa (TGA), little-endian.
 //
 //   offset size  field
-//        0    1  length of the identification text behind the header
+//        0    1  length of the identification text after the header
 //        1    1  1: there is a color map
-//        2    1  type: 1 color-mapped, 2 true color, 3 gray; 9, 10, 11 the same in run-length
-//        packets 3    2  first color map index 5    2  color map entries 7    1  bits of an entry:
-//        15, 16, 24 or 32 8    4  two origins, ignored
+//        2    1  type: 1 color-mapped, 2 true color, 3 gray; 9, 10, 11 the same with run-length
+//                packets
+//        3    2  first color map index
+//        5    2  color map entries
+//        7    1  bits per entry: 15, 16, 24 or 32
+//        8    4  two origins, ignored
 //       12    2  width
 //       14    2  height
-//       16    1  bits of a pixel: 8, 15, 16, 24 or 32
-//       17    1  descriptor: low four bits attribute (alpha) bits; 0x10 pixels run from the right,
-//       0x20 rows from the top 18       identification text, color map, pixels
+//       16    1  bits per pixel: 8, 15, 16, 24 or 32
+//       17    1  descriptor: low four bits attribute (alpha) bits; 0x10 right to left, 0x20 top row
+//                first
+//       18       identification text, color map, pixels
 //   end-26   26  footer of version 2: offsets of the extension area and the developer area,
-//   "TRUEVISION-XFILE." and 0
+//                "TRUEVISION-XFILE." and 0
 //
-// Pixels of 15 and 16 bits are A RRRRR GGGGG BBBBB, of 24 and 32 bits blue, green, red (alpha);
-// gray ones of 16 bits are gray and alpha. A packet is a byte n and one pixel, repeated n - 127
-// times (n from 128), or n + 1 pixels as they stand.
+// 15 and 16-bit pixels are A RRRRR GGGGG BBBBB, 24 and 32-bit ones blue, green, red (alpha); 16-bit
+// grays are gray and alpha. A packet is a byte n and one pixel, repeated n - 127 times (n >= 128),
+// or n + 1 literal pixels.
 //
-// The reader takes packets that go on in the next row. Attribute bits count as alpha when the
-// descriptor has them and the extension area, if there is one, does not call them useless; an
-// alpha plane without any opacity is taken for unset and dropped, as many programs leave these bits
-// zero.
+// The reader accepts packets that continue in the next row. Attribute bits are used as alpha if the
+// descriptor has them and the extension area, if there is one, does not declare them useless; an
+// alpha plane that is entirely transparent is considered unset and dropped, as many programs leave
+// these bits zero.
 //
-// The writer stores uncompressed rows from the bottom up, which every reader takes, with a version
-// 2 footer: up to 8 bits as color-mapped (grays as gray), 24 bits, 32 with an alpha plane; 16 bits
-// with CreateTarga16. Source: Truevision, "TGA File Format Specification, Version 2.0" (1991).
+// The writer stores uncompressed rows, bottom row first, which every reader supports, with a
+// version 2 footer: up to 8 bits as color-mapped (grays as gray), 24 bits, 32 with an alpha plane;
+// 16 bits with CreateTarga16. Source: Truevision, "TGA File Format Specification, Version 2.0"
+// (1991).
 #include "formats/targa/tga.h"
 
 #include <algorithm>
@@ -42,11 +47,11 @@ namespace fotomill {
 namespace {
 
 constexpr uint64_t kHeaderSize = 18, kFooterSize = 26;
-constexpr uint8_t kRunLengthType = 8;  // added to a type
+constexpr uint8_t kRunLengthType = 8;  // flag in the type
 constexpr uint8_t kMapped = 1, kTrueColor = 2, kGray = 3;
 constexpr uint8_t kFromRight = 0x10, kFromTop = 0x20;
 constexpr uint64_t kAttributeTypeOffset = 494;  // in the extension area
-constexpr uint8_t kUsefulAlpha = 3;             // attribute types below are no alpha
+constexpr uint8_t kUsefulAlpha = 3;             // lower attribute types are not alpha
 constexpr std::string_view kSignature("TRUEVISION-XFILE.\0", 18);
 
 struct TgaHeader {
@@ -65,7 +70,7 @@ struct TgaHeader {
   uint64_t MapOffset() const { return kHeaderSize + idLength; }
   uint64_t PixelOffset() const { return MapOffset() + MapSize(); }
   int32_t AttributeBits() const { return descriptor & 15; }
-  // Whether the pixels, or the colors of the map, carry a value that may be alpha.
+  // Whether the pixels, or the colors of the map, have bits that may be alpha.
   bool HasAttribute() const {
     if (AttributeBits() == 0) return false;
     const int32_t colorBits = type == kMapped ? mapBits : bits;
@@ -86,8 +91,8 @@ bool DepthFits(const TgaHeader& header) {
   return isColor(header.bits);
 }
 
-// Ok; FileReadError for a short header, NoImages for type 0, UnsupportedFormat for a type or depth
-// that is not read, DamagedFile for what no Targa file can say.
+// Ok; FileReadError for a truncated header, NoImages for type 0, UnsupportedFormat for an
+// unsupported type or depth, DamagedFile for invalid values.
 Status ParseHeader(std::span<const uint8_t> file, TgaHeader& header) {
   ByteReader bytes(file);
   header.idLength = bytes.U8();
@@ -118,7 +123,7 @@ struct Color {
 
 uint8_t FiveToEight(uint32_t value) { return static_cast<uint8_t>(value << 3 | value >> 2); }
 
-// One color of 15 to 32 bits, or a gray of 16.
+// A color of 15 to 32 bits, or a 16-bit gray.
 Color ColorFrom(const uint8_t* bytes, int32_t bits) {
   if (bits >= 24) return {bytes[0], bytes[1], bytes[2], bits == 32 ? bytes[3] : uint8_t{255}};
   const uint32_t value = static_cast<uint32_t>(bytes[0] | bytes[1] << 8);
@@ -129,8 +134,8 @@ Color ColorFrom(const uint8_t* bytes, int32_t bits) {
 
 using ColorMap = std::array<Color, 256>;
 
-// The map's colors at their indices; entries beyond 255 and those that the file lacks do not count.
-// FileReadError when the map is cut short.
+// Stores the map's colors at their indices; missing entries and those beyond 255 are ignored.
+// FileReadError if the map is truncated.
 Status ReadColorMap(std::span<const uint8_t> file, const TgaHeader& header, ColorMap& map) {
   map.fill({0, 0, 0, 255});
   if (header.type != kMapped) return Status::Ok;
@@ -171,7 +176,7 @@ void SetPalette(const TgaHeader& header, const ColorMap& map, Palette& palette) 
   }
 }
 
-// Whether the extension area of a version 2 file says that the attribute bits are no alpha.
+// Whether the extension area of a version 2 file says that the attribute bits are not alpha.
 bool AttributeIsUseless(std::span<const uint8_t> file) {
   if (file.size() < kFooterSize + kHeaderSize) return false;
   ByteReader footer(file.last(kFooterSize));
@@ -184,7 +189,7 @@ bool AttributeIsUseless(std::span<const uint8_t> file) {
   return bytes.Ok() && attributeType < kUsefulAlpha;
 }
 
-// Raw bytes of one row after another, whether packed or not.
+// Delivers the unpacked bytes row by row.
 class RowSource {
  public:
   RowSource(ByteReader& bytes, const TgaHeader& header)
@@ -193,7 +198,7 @@ class RowSource {
         pixelSize_(header.PixelSize()),
         row_(pixelSize_ * static_cast<uint64_t>(header.width)) {}
 
-  // The next row; empty when the data are cut short. Valid until the next call.
+  // The next row; empty if the data are truncated. Valid until the next call.
   std::span<const uint8_t> Next() {
     if (!runLength_) return bytes_.Take(row_.size());
     uint64_t filled = 0;
@@ -227,12 +232,12 @@ class RowSource {
   const bool runLength_;
   const uint64_t pixelSize_;
   std::vector<uint8_t> row_;
-  uint64_t left_ = 0;  // pixels of the packet that are still to come
+  uint64_t left_ = 0;  // remaining pixels of the packet
   bool isRun_ = false;
-  std::span<const uint8_t> value_;  // the pixel that a run repeats
+  std::span<const uint8_t> value_;  // the pixel repeated by a run
 };
 
-// What a row of the file becomes: indices, or colors and alpha (empty without a plane).
+// Converts a row of the file to indices, or to colors and alpha (empty without a plane).
 using RowReader = void (*)(std::span<const uint8_t> source, int32_t width, const ColorMap& map,
                            std::span<uint8_t> row, std::span<uint8_t> alpha);
 
@@ -292,7 +297,7 @@ void MirrorRow(std::span<uint8_t> row, int32_t width, size_t pixelSize) {
   }
 }
 
-// `done`: how many rows were read.
+// `done`: rows read.
 Status ReadRows(ByteReader& bytes, platform::FileView& file, const TgaHeader& header,
                 const ColorMap& map, const PictureRecord& picture, PackedImage& image,
                 PackedImage& alpha, int32_t& done) {
@@ -321,10 +326,10 @@ bool AnyOpacity(const PackedImage& alpha) {
   return std::ranges::any_of(alpha.Rows(), [](uint8_t value) { return value != 0; });
 }
 
-// What the writer stores for a picture.
+// File layout for a picture to write.
 struct TgaLayout {
   uint8_t type = kTrueColor;
-  int32_t bits = 24;  // of a pixel
+  int32_t bits = 24;  // per pixel
   int32_t attributeBits = 0;
 };
 
@@ -394,8 +399,8 @@ void WriteRow(const PictureRecord& picture, int32_t r, const TgaLayout& layout,
   }
 }
 
-// Whether the attribute is alpha, as far as that can be told quickly: where no pixel is opaque, it
-// is not. A file whose first pixels have none is taken at its word.
+// A quick check whether the attribute is alpha: not if all pixels are transparent. If the first
+// kMostPixels do not decide, the descriptor is trusted.
 bool ShowsOpacity(std::span<const uint8_t> file, const TgaHeader& header, const ColorMap& map) {
   constexpr uint64_t kMostPixels = 1 << 18;
   if (AttributeIsUseless(file)) return false;
@@ -416,7 +421,7 @@ bool ShowsOpacity(std::span<const uint8_t> file, const TgaHeader& header, const 
   return false;
 }
 
-// Reads what precedes the pixels, and fills in the picture's facts.
+// Reads everything before the pixels, and fills in the record.
 Status TakeHead(std::span<const uint8_t> file, TgaHeader& header, ColorMap& map,
                 PictureRecord& picture) {
   RETURN_IF_BAD(ParseHeader(file, header));

@@ -6,9 +6,9 @@
 
 namespace fotomill {
 
-// Truevision Targa. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when data are
-// cut short, MemoryAllocationError (6), UnsupportedFormat (8) for the types that are not read,
-// NoImages (20) for type 0.
+// Truevision Targa. Statuses: FileOpenError (1), DamagedFile (2),
+// FileReadError (3) if truncated, MemoryAllocationError (6),
+// UnsupportedFormat (8) for unsupported types, NoImages (20) for type 0.
 Status TgaInfo(PictureRecord& picture, const ReadRequest& request);
 Status TgaRead(PictureRecord& picture, const ReadRequest& request);
 // Also ErrorCreatingFile (10), ErrorWritingFile (11).

@@ -14,18 +14,18 @@ constexpr size_t kTab = 8;
 constexpr char32_t kUnknown = 0xfffd;
 constexpr std::string_view kUtf8Mark = "\xef\xbb\xbf";
 
-// What Windows-1252 has from 0x80 to 0x9F, where Latin-1 has control characters. Source: Unicode
-// Consortium, mapping table CP1252.
+// Windows-1252 from 0x80 to 0x9F, where Latin-1 has control characters. Source: Unicode Consortium,
+// mapping table CP1252.
 constexpr char32_t kWindows[] = {0x20ac, 0xfffd, 0x201a, 0x0192, 0x201e, 0x2026, 0x2020, 0x2021,
                                  0x02c6, 0x2030, 0x0160, 0x2039, 0x0152, 0xfffd, 0x017d, 0xfffd,
                                  0xfffd, 0x2018, 0x2019, 0x201c, 0x201d, 0x2022, 0x2013, 0x2014,
                                  0x02dc, 0x2122, 0x0161, 0x203a, 0x0153, 0xfffd, 0x017e, 0x0178};
 
-// Gathers characters into lines.
+// Assembles characters into lines.
 class LineBuilder {
  public:
   explicit LineBuilder(TextLines& text) : text_(text) {}
-  // False when no more characters are shown.
+  // False when no more characters will be shown.
   bool Add(char32_t c) {
     const bool afterReturn = std::exchange(return_, c == '\r');
     if (c == '\n' && afterReturn) return true;
@@ -100,7 +100,7 @@ bool ReadTextLines(std::span<const uint8_t> file, bool whole, TextLines& text) {
   std::string_view rest(reinterpret_cast<const char*>(file.data()), file.size());
   if (rest.find('\0') != std::string_view::npos) return false;
   if (rest.starts_with(kUtf8Mark)) rest.remove_prefix(kUtf8Mark.size());
-  // A file that is not seen whole may end within a character of up to four bytes.
+  // If only the head of a file was read, it may end within a character of up to four bytes.
   bool utf8 = IsUtf8(rest);
   for (size_t cut = 1; !utf8 && !whole && cut < std::min<size_t>(4, rest.size()); ++cut)
     utf8 = IsUtf8(rest.substr(0, rest.size() - cut));

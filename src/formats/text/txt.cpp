@@ -1,15 +1,15 @@
 // Text files (TXT).
 //
-// Reading draws the text with the glyphs of fixed_font.h, one character beside the other, with a
-// margin around. Such pictures are black on white, with InvertTextFiles white on black. Long lines
-// are broken, and long texts cut, as text_lines.h says.
+// The reader draws the text with the glyphs of fixed_font.h in fixed columns, with a margin around
+// it. Pictures are black on white, with InvertTextFiles white on black. Long lines are broken, and
+// long texts cut, see text_lines.h.
 //
-// Writing sets a character for each pixel across and two down, since characters are about twice
-// as high as wide: a column has the average brightness of its two pixels. TextCharacterLevels has
-// the characters from those with the least ink to those with the most, in UTF-8; or, when it is no
-// UTF-8, in Windows-1252. The byte 0xFF, a blank in the character sets of DOS, stands for a blank.
-// InvertTextFiles takes them the other way round, for light text on a dark screen. Every line ends
-// with a line feed; the file is UTF-8.
+// The writer converts one pixel horizontally and two vertically to a character, since characters
+// are about twice as high as wide, by the average brightness of the two pixels. TextCharacterLevels
+// has the characters, ordered from the least to the most ink, in UTF-8, or if it is not valid
+// UTF-8, in Windows-1252. The byte 0xFF, a blank in DOS character sets, stands for a blank.
+// InvertTextFiles reverses the order, for light text on a dark screen. Lines end in line feeds; the
+// file is UTF-8.
 #include "formats/text/txt.h"
 
 #include <algorithm>
@@ -59,7 +59,7 @@ Status DescribePicture(const ReadRequest& request, PictureRecord& picture, TextL
   return Status::Ok;
 }
 
-// Draws a line of text into the rows from `top` on; `paper` is 0xFF for black on white.
+// Draws a line of text into the rows starting at `top`; `paper` is 0xFF for black on white.
 void DrawLine(const std::u32string& line, int32_t top, uint8_t paper, PackedImage& image) {
   for (size_t i = 0; i < line.size(); ++i) {
     const GlyphRows& glyph = GlyphOf(line[i]);
@@ -89,7 +89,7 @@ std::string Utf8Of(char32_t c) {
   return {static_cast<char>(0xf0 | c >> 18), more(12), more(6), more(0)};
 }
 
-// The characters of a setting, each in UTF-8.
+// The characters of the setting, each in UTF-8.
 std::vector<std::string> SplitLevels(std::string_view setting) {
   std::vector<std::string> levels;
   const bool utf8 = IsUtf8(setting);
@@ -105,7 +105,7 @@ std::vector<std::string> SplitLevels(std::string_view setting) {
   return levels;
 }
 
-// The character of each brightness.
+// The character for each brightness.
 using Characters = std::array<std::string, 256>;
 
 Characters MakeCharacters(const EncodeOptions& encode) {

@@ -23,7 +23,7 @@ constexpr FormatSetting kKeys[] = {
     {"TiffOptions", TrLater("Compression")}, {"TiffResolution"}, {"JpegCompression"}};
 constexpr FormatSettings kSettings = {"TIF", "OverrideTifBox", TrLater("TIFF"), kKeys};
 
-// The number in "LIBTIFF, Version 4.5.0" and a copyright line.
+// The version is in "LIBTIFF, Version 4.5.0" and a copyright line.
 std::string TiffVersion() {
   const std::string text = TIFFGetVersion();
   const size_t start = text.find_first_of("0123456789");

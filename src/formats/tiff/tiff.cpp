@@ -1,22 +1,21 @@
-// TIFF and BigTIFF, either byte order, decoded by libtiff; tiff_write.cpp writes.
+// TIFF and BigTIFF, either byte order, decoded by libtiff; tiff_write.cpp is the writer.
 //
-//   "II" or "MM", 42, offset of the first directory (BigTIFF: 43, 8, 0, offset of 8 bytes); a
-//   directory is a count, entries of tag, type, count and value or offset, and the offset of the
-//   next one: each is a page. 254 subfile   256 width   257 height   258 bits   259 compression 262
-//   colors   273, 279 strips   277 samples 282, 283, 296 resolution   284 planes   320 palette
-//   322-325 tiles   338 extra samples   339 sample format 700 XMP   34665 EXIF   34675 ICC profile
+//   "II" or "MM", 42, offset of the first directory (BigTIFF: 43, 8, 0, 8-byte offset); a directory
+//   is a count, entries of tag, type, count and value or offset, and the offset of the next one:
+//   each is a page. 254 subfile   256 width   257 height   258 bits   259 compression   262 colors
+//   273, 279 strips 277 samples   282, 283, 296 resolution   284 planes   320 palette   322-325
+//   tiles 338 extra samples   339 sample format   700 XMP   34665 EXIF   34675 ICC profile
 //
-// What the reader makes of it: grays and palettes of 1, 2, 4 and 8 bits keep their depth (2 becomes
-// 4), deeper grays become 8 bits, everything else 24 bits, with an alpha plane where an extra
-// sample says that it is alpha; colors that were multiplied by it are divided again. CMYK is turned
-// into RGB by the usual formula. CIE L*a*b* is turned into sRGB by lcms2. YCbCr that is not JPEG
-// and LogLuv come through the library's own conversion. Orientation is not applied here: it travels
-// in the EXIF block, which is gathered from the directories of a camera. XMP, ICC profile,
-// description and resolution travel with the picture as well.
+// Reader: grays and palettes of 1, 2, 4 and 8 bits keep their depth (2 becomes 4), deeper grays
+// become 8 bits, everything else 24 bits, with an alpha plane if an extra sample is marked as
+// alpha; premultiplied colors are divided by alpha. CMYK is converted to RGB by the usual formula,
+// CIE L*a*b* to sRGB by lcms2. YCbCr other than JPEG, and LogLuv, are converted by libtiff.
+// Orientation is not applied here but stored in the EXIF block, which is assembled from the
+// camera's directories. XMP, ICC profile, description and resolution are kept as well.
 //
-// A file that ends before its last pixel fails (status 3). A fault inside the data that the decoder
-// passes over is noted in the record's `warning`. Source: Adobe, "TIFF Revision 6.0", 1992;
-// Technical Notes 1 to 3; libtiff's documentation of BigTIFF.
+// A file that ends before its last pixel fails (status 3). If the decoder recovers from damaged
+// data, the record's `warning` is set. Source: Adobe, "TIFF Revision 6.0", 1992; Technical Notes 1
+// to 3; libtiff's documentation of BigTIFF.
 #include "formats/tiff/tiff.h"
 
 #include <algorithm>
@@ -41,16 +40,16 @@ namespace fotomill {
 namespace {
 
 constexpr double kCentimetersPerInch = 2.54;
-constexpr uint32_t kMostRowSamples = 1 << 25;  // a row is held as a whole
+constexpr uint32_t kMostRowSamples = 1 << 25;  // whole rows are kept in memory
 
-// Uncompressed pixels must be in the file before memory is taken for them.
+// Checks that uncompressed pixels are within the file before allocating memory for them.
 bool FileHoldsPixels(const TiffInput& input, const TiffLayout& layout) {
   if (layout.compression != COMPRESSION_NONE || layout.rows == TiffRows::Library) return true;
   const uint64_t rowBytes = (uint64_t{layout.width} * layout.form.bits * layout.samples + 7) / 8;
   return rowBytes <= input.Bytes().size() / layout.height;
 }
 
-// Colors of 16 bits; some programs store 8.
+// 16-bit colors; some programs store 8 bits.
 void TakeColors(TIFF* tiff, size_t count, Palette& palette) {
   uint16_t* channels[3] = {};
   if (TIFFGetField(tiff, TIFFTAG_COLORMAP, &channels[0], &channels[1], &channels[2]) == 0) return;
@@ -115,10 +114,10 @@ bool HoldsIptc(TIFF* tiff) {
          TIFFGetField(tiff, TIFFTAG_PHOTOSHOP, &size, &data) != 0;
 }
 
-// Whether there are tags of weight that a new file would not have: captions, places on the earth,
-// and without a camera's directory those of the author.
+// Whether there are important tags that would be lost in a new file: captions, GPS positions, and,
+// without a camera's directory, those about the author.
 bool HoldsFurtherTags(TIFF* tiff) {
-  // the last: GeoTIFF
+  // the last one: GeoTIFF
   constexpr uint32_t kFurther[] = {
       TIFFTAG_RICHTIFFIPTC, TIFFTAG_PHOTOSHOP, 33550, 33922, 34264, 34735};
   uint64_t place = 0;
@@ -133,7 +132,7 @@ bool HoldsFurtherTags(TIFF* tiff) {
   return false;
 }
 
-// Opens a page and fills the facts.
+// Opens a page and fills in the record.
 Status Describe(TiffInput& input, int32_t page, TiffLayout& layout, PictureRecord& picture) {
   RETURN_IF_BAD(input.Open());
   const std::vector<uint64_t> offsets = input.PageOffsets();
@@ -161,17 +160,17 @@ Status Describe(TiffInput& input, int32_t page, TiffLayout& layout, PictureRecor
   return Status::Ok;
 }
 
-// Whether rows can be taken from the strips without the library: whole bytes or less a sample, in
-// the usual bit order.
+// Whether strips can be decoded without the library: samples of at most one byte, in the
+// usual bit order.
 bool HasPlainStrips(TIFF* tiff, const TiffLayout& layout) {
   return !layout.tiled && !layout.separate && layout.form.bits <= 8 &&
          TiffField<uint16_t>(tiff, TIFFTAG_FILLORDER) == FILLORDER_MSB2LSB &&
          (layout.photometric != PHOTOMETRIC_YCBCR);
 }
 
-// Uncompressed rows straight from the file, LZW through our own decoder, which is three times as
-// fast as the library's. False, with the target in any state, for every other page and for anything
-// odd: then the library says what is the matter.
+// Reads uncompressed rows directly from the file, and LZW with our own decoder, which is three
+// times as fast as the library's. False, with the target in an undefined state, for all other pages
+// and for any irregularity: then the library reports the error.
 bool ReadPlainStrips(TiffInput& input, const TiffLayout& layout, const PictureRecord& picture,
                      TiffConverter& converter) {
   TIFF* tiff = input.Handle();
@@ -199,20 +198,20 @@ bool ReadPlainStrips(TiffInput& input, const TiffLayout& layout, const PictureRe
     if (packed && decoded == nullptr) return false;
     for (uint32_t r = 0; r < rows; ++r) {
       const uint64_t place = r * rowBytes;
-      // Differences between neighbors are what the format's namesake in PNG has too.
+      // Horizontal differencing is the same as PNG's Sub filter.
       if (differences && !UndoPngFilter(static_cast<uint8_t>(PngFilter::Sub), decoded + place,
                                         none.data(), rowBytes, layout.samples)) {
         return false;
       }
       const auto y = static_cast<int32_t>(top + r);
       converter.Store(y, packed ? decoded + place : data.data() + place, 0);
-      if (picture.ReportRow(y) != Status::Ok) return false;  // the library's way ends at once
+      if (picture.ReportRow(y) != Status::Ok) return false;  // the library then stops at once
     }
   }
   return true;
 }
 
-// `done`: how many rows came.
+// `done`: rows read.
 Status ReadScanlines(TiffInput& input, const TiffLayout& layout, const PictureRecord& picture,
                      TiffConverter& converter, uint32_t& done) {
   TIFF* tiff = input.Handle();
@@ -229,8 +228,7 @@ Status ReadScanlines(TiffInput& input, const TiffLayout& layout, const PictureRe
   return Status::Ok;
 }
 
-// A band of rows as wide as the picture, of one plane after the other, filled from tiles or from
-// strips of each plane.
+// A band of rows of full width, in one or more planes, assembled from tiles or strips.
 class TiffBand {
  public:
   TiffBand(TiffInput& input, const TiffLayout& layout) : input_(input), layout_(layout) {
@@ -239,7 +237,7 @@ class TiffBand {
     rowBytes_ = (layout.width * bitsPerPixel_ + 7) / 8;
     rows_ = std::min(layout.bandHeight, layout.height);
   }
-  // `held`: what the picture itself takes.
+  // `held`: size of the picture itself.
   Status Allocate(uint64_t held) {
     const uint64_t planeBytes = rowBytes_ * rows_;
     if (planeBytes > limits.packedBlockBytes / planes_) return Status::MemoryAllocationError;
@@ -295,7 +293,7 @@ class TiffBand {
   platform::MemoryBlock bytes_, piece_;
 };
 
-// `done`: how many rows came.
+// `done`: rows read.
 Status ReadBands(TiffInput& input, const TiffLayout& layout, const PictureRecord& picture,
                  uint64_t held, TiffConverter& converter, uint32_t& done) {
   TiffBand band(input, layout);
@@ -311,8 +309,8 @@ Status ReadBands(TiffInput& input, const TiffLayout& layout, const PictureRecord
   return Status::Ok;
 }
 
-// What only the library can convert comes as one raster of red, green, blue and alpha, colors
-// multiplied by alpha.
+// Pixel formats that only the library can convert come as one raster of red, green, blue
+// and alpha, premultiplied.
 Status ReadThroughLibrary(TiffInput& input, const TiffLayout& layout, PictureRecord& picture,
                           TiffTarget& target) {
   const uint64_t pixels = uint64_t{layout.width} * layout.height;
@@ -360,7 +358,7 @@ Status ReadPixels(TiffInput& input, const TiffLayout& layout, bool partial,
     uint32_t rows = 0;
     Status status = Status::Ok;
     if (!ReadPlainStrips(input, layout, picture, converter)) {
-      // the library's old-style JPEG decoder gives whole strips only
+      // the library's old-style JPEG decoder requires whole strips
       const bool whole = layout.compression == COMPRESSION_OJPEG;
       status = layout.tiled || layout.separate || whole
                    ? ReadBands(input, layout, picture, held, converter, rows)

@@ -7,15 +7,15 @@
 
 namespace fotomill {
 
-// TIFF and BigTIFF. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when the file
-// ends before its pixels, MemoryAllocationError (6), UnsupportedFormat (8) for samples or
-// compressions that are not decoded, NoImages (20) for a page that is not there. Reads the
+// TIFF and BigTIFF. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) if truncated,
+// MemoryAllocationError (6), UnsupportedFormat (8) for unsupported samples or compressions,
+// NoImages (20) if the page does not exist. Reads the request's page.
 // request's page.
 Status TiffInfo(PictureRecord& picture, const ReadRequest& request);
 Status TiffRead(PictureRecord& picture, const ReadRequest& request);
 // Also ErrorCreatingFile (10), ErrorWritingFile (11).
 Status TiffWrite(PictureRecord& picture, const WriteOptions& options);
-// A file of several pages.
+// Writes a file with several pages.
 Status TiffSequenceBegin(const std::string& path, const SequenceFacts& facts,
                          const WriteOptions& options, SequencePointer& sequence);
 Status TiffDetails(PictureRecord& picture);

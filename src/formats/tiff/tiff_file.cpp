@@ -14,7 +14,7 @@ namespace fotomill {
 
 namespace {
 
-constexpr uint64_t kPlaceOfFirst = 4;  // where the head names the first directory
+constexpr uint64_t kPlaceOfFirst = 4;  // position of the first directory's offset
 
 TiffMessages& MessagesOf(void* user) { return *static_cast<TiffMessages*>(user); }
 
@@ -45,7 +45,7 @@ struct OptionsDeleter {
 using Options = std::unique_ptr<TIFFOpenOptions, OptionsDeleter>;
 
 Options NewOptions(TiffMessages& messages) {
-  // Some messages are sent without the file they belong to.
+  // Some messages are not associated with a file.
   static const bool silenced = [] {
     TIFFSetErrorHandler(nullptr);
     TIFFSetWarningHandler(nullptr);
@@ -72,7 +72,7 @@ uint64_t SeekInput(thandle_t handle, uint64_t offset, int from) {
 }
 uint64_t InputSize(thandle_t handle) { return InputOf(handle).Bytes().size(); }
 int MapInput(thandle_t handle, void** base, toff_t* size) {
-  *base = const_cast<uint8_t*>(InputOf(handle).Bytes().data());  // the library only reads it
+  *base = const_cast<uint8_t*>(InputOf(handle).Bytes().data());  // the library does not write to it
   *size = InputOf(handle).Bytes().size();
   return 1;
 }
@@ -111,8 +111,8 @@ Status TiffInput::OpenAt(uint64_t directory) {
   return Open();
 }
 
-// Puts the directory's offset into what was read of the header from `offset` on: behind the 4 bytes
-// of signature and version, in BigTIFF behind 8.
+// Replaces the first directory's offset in header bytes read from `offset` on: it follows the 4
+// bytes of signature and version, in BigTIFF 8 bytes.
 void TiffInput::NameDirectory(uint64_t offset, std::span<uint8_t> bytes) const {
   const bool bigEndian = bytes_[0] == 'M', big = (bigEndian ? bytes_[3] : bytes_[2]) == 43;
   const uint64_t field = big ? 8 : 4, size = field;
@@ -123,7 +123,7 @@ void TiffInput::NameDirectory(uint64_t offset, std::span<uint8_t> bytes) const {
   }
 }
 
-// A look at the directories visited is only needed where the chain goes back.
+// Visited directories are only tracked once the chain goes backward.
 std::vector<uint64_t> TiffInput::PageOffsets() const {
   const bool big = TIFFIsBigTIFF(tiff_) != 0;
   const bool bigEndian = TIFFIsBigEndian(tiff_) != 0;
@@ -196,7 +196,7 @@ bool TiffOutput::Open() {
   return tiff_ != nullptr;
 }
 
-// The file's head names the directory, which begins with the number of its entries.
+// The file header has the offset of the directory, which starts with the number of its entries.
 void TiffOutput::NoteDirectory(std::span<const uint8_t> bytes) {
   ByteReader reader(bytes);
   if (position_ == kPlaceOfFirst && bytes.size() == 4) directory_ = reader.Le32();

@@ -11,11 +11,11 @@
 
 namespace fotomill {
 
-// What the library says while it works on one file; nothing is printed.
+// The library's messages for one file; never printed.
 struct TiffMessages {
   char error[160] = {};    // the first error
-  char warning[160] = {};  // the first fault in pixel data that was passed over
-  bool inPixels = false;   // pixels are being decoded: warnings count from here on
+  char warning[160] = {};  // the first warning about pixel data
+  bool inPixels = false;   // pixels are being decoded, so warnings are recorded
 };
 
 // A TIFF file in memory, opened for reading at its first directory. `bytes` must outlive it.
@@ -26,22 +26,22 @@ class TiffInput {
   TiffInput(const TiffInput&) = delete;
   TiffInput& operator=(const TiffInput&) = delete;
 
-  // Ok; FileReadError (3) when the file ends too early, DamagedFile (2) when it is none or its
-  // directory makes no sense.
+  // Ok; FileReadError (3) if the file is truncated, DamagedFile (2) if it is not a TIFF file or its
+  // directory is invalid.
   Status Open();
-  // Opens the file again at another directory, as if its header named that one: the library would
-  // otherwise follow the whole chain for each page. Statuses of Open.
+  // Reopens the file at another directory, as if its header pointed there: the library would
+  // otherwise walk the whole chain for each page. Statuses of Open.
   Status OpenAt(uint64_t directory);
-  // Offsets of the page directories within the file, up to the limit; a second visit ends the
-  // chain. Of a file that is open.
+  // Offsets of all page directories, up to the limit; stops at a repeated one. The file
+  // must be open.
   std::vector<uint64_t> PageOffsets() const;
-  // What a failed call of the library means, by its message.
+  // The status for a failed library call, by its message.
   Status Failure() const;
-  TIFF* Handle() const { return tiff_; }  // of the library; null until Open
-  TiffMessages& Messages() { return messages_; }  // what the library has said so far
+  TIFF* Handle() const { return tiff_; }  // the library's handle; null until Open
+  TiffMessages& Messages() { return messages_; }  // the library's messages so far
   std::span<const uint8_t> Bytes() const { return bytes_; }
 
-  // The library's doors to the bytes.
+  // Callbacks of the library.
   tmsize_t Read(void* target, tmsize_t count);
   uint64_t Seek(uint64_t offset, int from);
 
@@ -50,7 +50,7 @@ class TiffInput {
 
   std::span<const uint8_t> bytes_;
   uint64_t position_ = 0;
-  uint64_t directory_ = 0;  // what the header is said to name; 0: what it does name
+  uint64_t directory_ = 0;  // replaces the offset in the header; 0: not replaced
   TIFF* tiff_ = nullptr;
   TiffMessages messages_;
 };
@@ -63,12 +63,12 @@ class TiffOutput {
   TiffOutput(const TiffOutput&) = delete;
   TiffOutput& operator=(const TiffOutput&) = delete;
 
-  [[nodiscard]] bool Open();  // false if there is no memory
+  [[nodiscard]] bool Open();  // false if memory runs out
   TIFF* Handle() const { return tiff_; }
-  // Bytes that the file has; and more of them, which the library knows nothing of.
+  // The current size; and appends bytes that are not written by the library.
   uint64_t End() const { return out_.Position(); }
   void Append(std::span<const uint8_t> bytes) { out_.Bytes(bytes); }
-  // Of the directory that was written: its place, and where in it the place of the next one is.
+  // Offset of the last directory, and the position of the next one's offset in it.
   uint32_t Directory() const { return directory_; }
   uint32_t NextPlace() const { return directory_ + 2 + 12 * entries_; }
 

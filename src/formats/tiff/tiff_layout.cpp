@@ -10,7 +10,7 @@ namespace {
 void FindAlpha(TIFF* tiff, TiffLayout& layout) {
   uint16_t count = 0, *kinds = nullptr;
   const bool told = TIFFGetField(tiff, TIFFTAG_EXTRASAMPLES, &count, &kinds) != 0 && count > 0;
-  // old files do not say
+  // not marked in old files
   if (!told && layout.photometric == PHOTOMETRIC_RGB && layout.samples == 4) layout.alpha = 3;
   if (!told) return;
   for (uint16_t i = 0; i < count && layout.alpha < 0; ++i) {
@@ -71,7 +71,7 @@ Status ReadTiffLayout(TIFF* tiff, TiffLayout& layout) {
   layout.form.kind = format == SAMPLEFORMAT_IEEEFP ? TiffSampleForm::Float
                      : format == SAMPLEFORMAT_INT  ? TiffSampleForm::Signed
                                                    : TiffSampleForm::Unsigned;
-  // old fax files leave it out
+  // missing in old fax files
   if (TIFFGetField(tiff, TIFFTAG_PHOTOMETRIC, &layout.photometric) == 0) {
     layout.photometric = layout.samples >= 3 ? PHOTOMETRIC_RGB : PHOTOMETRIC_MINISWHITE;
   }

@@ -9,33 +9,33 @@
 
 namespace fotomill {
 
-// How the rows of a page become the picture's.
+// How rows of a page are converted.
 enum class TiffRows {
-  Direct,   // as the picture stores them
-  Nibbles,  // 2-bit values, to become 4-bit ones
-  Gray,     // through bytes, one of them a pixel
-  Colors,   // through bytes, to blue, green, red and alpha
-  Library   // the library's own conversion
+  Direct,   // as stored in the picture
+  Nibbles,  // 2-bit values, expanded to 4 bits
+  Gray,     // via bytes, one per pixel
+  Colors,   // via bytes, to blue, green, red and alpha
+  Library   // by the library
 };
 
-// A page as its directory describes it.
+// A page, from its directory.
 struct TiffLayout {
   uint32_t width = 0, height = 0;  // pixels
   TiffSampleForm form;
-  uint16_t samples = 1, colors = 1;           // of a pixel, and how many of them are colors
-  uint16_t photometric = 0, compression = 0;  // numbers of the format
-  bool separate = false;                      // each sample has strips or tiles of its own
+  uint16_t samples = 1, colors = 1;           // per pixel, and number of color samples
+  uint16_t photometric = 0, compression = 0;  // TIFF constants
+  bool separate = false;                      // each sample has separate strips or tiles
   bool tiled = false;
-  uint32_t bandHeight = 0;  // rows of a strip or tile
+  uint32_t bandHeight = 0;  // rows per strip or tile
   uint32_t tileWidth = 0;
-  int alpha = -1;           // the sample that is alpha
-  bool multiplied = false;  // colors were multiplied by alpha
+  int alpha = -1;           // index of the alpha sample
+  bool multiplied = false;  // premultiplied colors
   TiffRows rows = TiffRows::Library;
   int32_t bitsPerPixel = 24;  // of the picture: 1, 4, 8 or 24
 };
 
-// The value of a tag of the directory that is open, its default where the file does not have it.
-// `T` is what the library stores for the tag.
+// The value of a tag in the current directory, or its default. `T` is the library's type
+// for the tag.
 template <typename T>
 T TiffField(TIFF* tiff, uint32_t tag) {
   T value = 0;
@@ -43,7 +43,7 @@ T TiffField(TIFF* tiff, uint32_t tag) {
   return value;
 }
 
-// Reads the directory that is open, and makes the library decode JPEG as RGB. Ok, or DamagedFile
+// Reads the current directory, and sets up the library to decode JPEG as RGB. Ok, or DamagedFile
 // (2) for a directory without pixels.
 Status ReadTiffLayout(TIFF* tiff, TiffLayout& layout);
 

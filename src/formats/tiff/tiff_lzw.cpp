@@ -9,7 +9,7 @@ namespace {
 
 constexpr uint32_t kClear = 256, kEnd = 257, kFirst = 258;
 constexpr uint32_t kMostBits = 12;
-constexpr uint32_t kLastCode = 4093;  // an encoder clears the table after it
+constexpr uint32_t kLastCode = 4093;  // the table is cleared after it
 
 uint64_t LoadBe64(const uint8_t* bytes) {
   uint64_t value;
@@ -17,13 +17,13 @@ uint64_t LoadBe64(const uint8_t* bytes) {
   return std::endian::native == std::endian::little ? __builtin_bswap64(value) : value;
 }
 
-// Codes from the most significant bit down; past the end there are zeros, and Ok() turns false.
+// Reads codes, most significant bit first; past the end they are 0, and Ok() turns false.
 class CodeReader {
  public:
   explicit CodeReader(std::span<const uint8_t> source)
       : next_(source.data()), end_(source.data() + source.size()) {}
   uint32_t Take(unsigned width) {
-    // every time and without a look at what is there: cheaper than a branch that often goes wrong
+    // unconditionally: cheaper than a branch that is often mispredicted
     if (end_ - next_ >= 8) {
       bits_ |= LoadBe64(next_) >> count_;
       next_ += (63 - count_) / 8;
@@ -39,8 +39,7 @@ class CodeReader {
   bool Ok() const { return !overrun_; }
 
  private:
-  // Near the end, byte by byte. Bits behind the first `count_` are those of the bytes that follow,
-  // or zeros.
+  // Near the end, byte by byte. Bits after the first `count_` are lookahead, or zeros.
   void Refill(unsigned width) {
     bits_ &= count_ == 0 ? 0 : ~uint64_t{0} << (64 - count_);
     while (count_ < width) {
@@ -58,7 +57,7 @@ class CodeReader {
   bool overrun_ = false;
 };
 
-// Codes to bytes, with room for the longest taken beforehand.
+// Appends codes, with space for the maximum reserved beforehand.
 class CodeWriter {
  public:
   explicit CodeWriter(uint8_t* target) : start_(target), next_(target) {}
@@ -83,8 +82,8 @@ class CodeWriter {
   unsigned count_ = 0;
 };
 
-// Copies by pieces of 16, the last of which may go beyond the string, unless source and target are
-// too near for that.
+// Copies in blocks of 16, possibly past the end of the string, unless source and target overlap
+// within a block.
 void CopyString(const uint8_t* from, uint64_t length, uint64_t distance, uint8_t* to) {
   constexpr uint64_t kPiece = 16;
   if (distance < kPiece) {
@@ -102,7 +101,7 @@ void CopyString(const uint8_t* from, uint64_t length, uint64_t distance, uint8_t
 
 uint8_t* TiffLzwDecoder::Decode(std::span<const uint8_t> source, size_t size) {
   if (size > UINT32_MAX - kLiterals) return nullptr;
-  // the old kind begins so
+  // signature of the old variant
   if (source.size() >= 2 && source[0] == 0 && (source[1] & 1) != 0) return nullptr;
   output_.resize(kLiterals + size + kSlack);
   uint8_t* const bytes = output_.data();
@@ -112,8 +111,8 @@ uint8_t* TiffLzwDecoder::Decode(std::span<const uint8_t> source, size_t size) {
   }
   CodeReader codes(source);
   uint32_t next = kFirst, width = 9;
-  Entry last = {0, 0};                  // the string before, without length right after a clear
-  uint32_t widest = (1u << width) - 1;  // the entry with which codes grow
+  Entry last = {0, 0};                  // the previous string; empty after a clear code
+  uint32_t widest = (1u << width) - 1;  // the code at which the width grows
   uint64_t place = kLiterals;
   const uint64_t end = kLiterals + size;
   while (place < end) {
@@ -130,7 +129,7 @@ uint8_t* TiffLzwDecoder::Decode(std::span<const uint8_t> source, size_t size) {
       return nullptr;
     if (last.length > 0) {
       if (next >= kMostCodes) return nullptr;
-      entries_[next++] = {last.place, last.length + 1};  // its last byte is the one that comes now
+      entries_[next++] = {last.place, last.length + 1};  // its last byte is the one appended next
       if (next >= widest && width < kMostBits) widest = (1u << ++width) - 1;
     } else if (code >= kLiterals) {
       return nullptr;
@@ -145,7 +144,7 @@ uint8_t* TiffLzwDecoder::Decode(std::span<const uint8_t> source, size_t size) {
 }
 
 void TiffLzwEncoder::Encode(std::span<const uint8_t> source, std::vector<uint8_t>& coded) {
-  // At most a code of 12 bits for every byte, a clear for every table, and the last ones.
+  // At most one 12-bit code per byte, a clear code per table, and the final ones.
   coded.resize(source.size() * 3 / 2 + source.size() / 1024 + 64);
   CodeWriter out(coded.data());
   uint32_t next = kFirst, width = 9;

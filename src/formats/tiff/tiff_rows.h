@@ -12,19 +12,19 @@
 
 namespace fotomill {
 
-// The planes that a page is decoded into, of the page's size; no alpha plane where it has none.
+// The images a page is decoded into, of the page's size; `alpha` is empty if it has none.
 struct TiffTarget {
   PackedImage image, alpha;
 };
 
-// Turns decoded rows of a page into the picture's; not for TiffRows::Library.
+// Converts decoded rows of a page; not for TiffRows::Library.
 class TiffConverter {
  public:
   // All three must outlive it.
   TiffConverter(const TiffLayout& layout, const Palette& palette, TiffTarget& target);
 
-  // Stores row `y` from the top. `row` holds all samples as the file has them, or the first one's
-  // row with those of the others `planeStride` bytes apart, 0 where they stand together.
+  // Stores row `y` from the top. `row` has interleaved samples as in the file, or the first
+  // sample's row followed by the others, `planeStride` bytes apart (0 if interleaved).
   void Store(int32_t y, const uint8_t* row, size_t planeStride);
 
  private:

@@ -9,7 +9,7 @@ namespace fotomill {
 namespace {
 
 uint8_t FromReal(double value) {
-  if (!(value > 0)) return 0;  // also what is no number
+  if (!(value > 0)) return 0;  // also for NaN
   return value >= 1 ? 255 : static_cast<uint8_t>(value * 255 + 0.5);
 }
 
@@ -85,8 +85,8 @@ void ConvertSamples(const uint8_t* source, const TiffSampleForm& form, bool scal
     return;
   }
   const uint64_t most = (uint64_t{1} << form.bits) - 1;
-  // Signed samples are moved to where the lowest is black. Bytes are not: what writes them means
-  // values from 0 to 255.
+  // Signed samples are shifted so that the lowest value is black. Bytes are not: programs that
+  // write them mean 0 to 255.
   const auto sign = static_cast<uint32_t>(
       form.kind == TiffSampleForm::Signed && form.bits != 8 ? uint64_t{1} << (form.bits - 1) : 0);
   for (size_t i = 0; i < count; ++i) {

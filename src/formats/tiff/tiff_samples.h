@@ -5,20 +5,20 @@
 
 namespace fotomill {
 
-// How the samples of a TIFF file are stored.
+// Sample format of a TIFF file.
 struct TiffSampleForm {
   enum Kind { Unsigned, Signed, Float };
   uint32_t bits = 8;
   Kind kind = Unsigned;
 };
 
-// Whether such samples can be turned into bytes: up to 32 bits, or real numbers of 16, 32 and 64.
+// Whether samples can be converted to bytes: up to 32 bits, or 16, 32 and 64-bit floating point.
 bool CanConvert(const TiffSampleForm& form);
 
-// Turns `count` packed samples into bytes: target[0], target[step], ... With `scaled`, the full
-// range of the form (for real numbers 0 to 1) becomes 0 to 255, rounded; without it, samples of up
-// to 8 bits keep their value. Samples of 16, 24, 32 and 64 bits are in the machine's byte order,
-// others in big-endian bit order, as the library hands them out.
+// Converts `count` packed samples to bytes: target[0], target[step], ... With `scaled`, the full
+// range (for floating point 0 to 1) is mapped to 0 to 255, rounded; otherwise samples of up to 8
+// bits keep their value. Samples of 16, 24, 32 and 64 bits are in native byte order, others in
+// big-endian bit order, as delivered by the library.
 void ConvertSamples(const uint8_t* source, const TiffSampleForm& form, bool scaled, size_t count,
                     uint8_t* target, size_t step);
 

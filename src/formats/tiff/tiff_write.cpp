@@ -1,9 +1,9 @@
-// The TIFF writer: little-endian, in strips compressed as TiffOptions says. Palettes of
-// 1, 4 and 8 bits keep their depth (grays as gray), colors are RGB, with an alpha plane as a
-// separate extra sample. CCITT group 4 takes black and white pictures, JPEG grays of 8 bits and
-// colors without alpha; LZW takes the rest. Resolution is the picture's, else TiffResolution. An
-// EXIF block is spread over the file's directories; a thumbnail in it stays behind, as it would be
-// a page.
+// The TIFF writer: little-endian, in strips, compressed according to TiffOptions. Palettes of 1, 4
+// and 8 bits keep their depth (grays as gray), colors are RGB, with an alpha plane as a separate
+// extra sample. CCITT Group 4 is used for black and white only, JPEG for 8-bit grays and colors
+// without alpha; everything else falls back to LZW. The resolution is the picture's, else
+// TiffResolution. An EXIF block is stored in the file's own directories, without its thumbnail,
+// which would become a page.
 #include <algorithm>
 #include <memory>
 #include <span>
@@ -23,11 +23,11 @@ namespace fotomill {
 namespace {
 
 constexpr uint64_t kStripBytes = 128 * 1024;
-constexpr uint32_t kJpegBlock = 16;  // rows of a strip are a multiple of it
+constexpr uint32_t kJpegBlock = 16;  // strip heights are a multiple
 
 enum class Grays { No, Rising, Falling };
 
-// Whether the palette is the gray ramp of its depth, from black or from white.
+// Whether the palette is the gray ramp of its depth, starting at black or at white.
 Grays GraysOf(const PictureRecord& picture) {
   const int colors = picture.image.Colors();
   bool rising = colors > 0, falling = colors > 0;
@@ -43,8 +43,8 @@ struct TiffPlan {
   uint16_t compression = COMPRESSION_LZW;
   uint16_t photometric = PHOTOMETRIC_RGB;
   uint16_t samples = 1, bits = 8;
-  bool predict = false;  // differences between neighbours compress better
-  bool invert = false;   // faxes are black on white
+  bool predict = false;  // horizontal differencing
+  bool invert = false;   // fax pictures are black on white
 };
 
 uint16_t CompressionFor(const TiffPlan& plan, Grays grays, int32_t choice) {
@@ -127,8 +127,8 @@ void SetLayout(TIFF* tiff, const PictureRecord& picture, const TiffPlan& plan,
       static_cast<uint32_t>(std::min<uint64_t>(rows, static_cast<uint64_t>(image.Height()))));
 }
 
-// Tags of titles and ratings that the library does not know. Source: Microsoft, "Photo Metadata
-// Policies".
+// Tags of titles and ratings that are unknown to the library. Source: Microsoft,
+// "Photo Metadata Policies".
 constexpr TIFFFieldInfo kTitles[] = {
     {0x4746, 1, 1, TIFF_SHORT, FIELD_CUSTOM, 1, 0, const_cast<char*>("Rating")},
     {0x4749, 1, 1, TIFF_SHORT, FIELD_CUSTOM, 1, 0, const_cast<char*>("RatingPercent")},
@@ -139,7 +139,7 @@ constexpr TIFFFieldInfo kTitles[] = {
     {0x9C9F, TIFF_VARIABLE2, TIFF_VARIABLE2, TIFF_BYTE, FIELD_CUSTOM, 1, 1, const_cast<char*>("XPSubject")},
 };
 
-// What the EXIF block's first directory says of the picture goes into the file's own.
+// Copies tags of the EXIF block's IFD0 that describe the picture to the file's directory.
 void SetDescription(TIFF* tiff, const ExifDirectories& directories) {
   TIFFMergeFieldInfo(tiff, kTitles, static_cast<uint32_t>(std::size(kTitles)));
   for (const ExifEntry& entry : directories.first) {
@@ -162,7 +162,7 @@ void SetDescription(TIFF* tiff, const ExifDirectories& directories) {
   TIFFSetField(tiff, TIFFTAG_ORIENTATION, int{OrientationOf(directories)});
 }
 
-// The directories of a camera, which have to be in the file before the one that points to them.
+// Writes the EXIF directories, which must precede the directory that points to them.
 void WriteExif(TiffOutput& output, const ExifDirectories& directories) {
   const PlacedExif placed = PlaceExif(directories, static_cast<uint32_t>(output.End()));
   output.Append(placed.bytes);
@@ -199,7 +199,7 @@ void SetMetadata(TiffOutput& output, PictureRecord& picture, const WriteOptions&
     TIFFSetField(tiff, TIFFTAG_IMAGEDESCRIPTION, comment.c_str());
 }
 
-// A row as the file holds it. The library's predictor and byte orders work inside the buffer.
+// A row in file layout. The library's predictor and byte swapping modify the buffer.
 void MakeRow(const PictureRecord& picture, const TiffPlan& plan, int32_t y,
              std::vector<uint8_t>& row) {
   const uint8_t* source = picture.image.Row(y).data();
@@ -234,7 +234,7 @@ Status WriteScanlines(TIFF* tiff, const PictureRecord& picture, const TiffPlan& 
   return Status::Ok;
 }
 
-// LZW strips of our own coder, which takes two thirds of the library's time.
+// Writes LZW strips with our own encoder, which takes two thirds of the library's time.
 Status WriteLzwStrips(TIFF* tiff, const PictureRecord& picture, const TiffPlan& plan,
                       size_t rowBytes) {
   uint32_t rowsPerStrip = 0;
@@ -260,7 +260,7 @@ Status WriteLzwStrips(TIFF* tiff, const PictureRecord& picture, const TiffPlan& 
   return Status::Ok;
 }
 
-// A directory with its picture; further ones may follow.
+// Writes a directory with its picture; further ones may follow.
 Status WritePage(TiffOutput& output, PictureRecord& picture, const WriteOptions& options) {
   TIFF* tiff = output.Handle();
   const TiffPlan plan = MakePlan(picture, options.encode.tiffCompression);
@@ -273,8 +273,8 @@ Status WritePage(TiffOutput& output, PictureRecord& picture, const WriteOptions&
   return TIFFWriteDirectory(tiff) != 0 ? Status::Ok : Status::ErrorWritingFile;
 }
 
-// The library reads back what it wrote to find the last page, which a file in the making does not
-// allow. So each page is written as the only one of its file, and the pages are linked here.
+// The library would read the file back to find the last page, which is not possible while it is
+// being written. So each page is written as if it were the only one, and the pages are linked here.
 class TiffSequence final : public SequenceWriter {
  public:
   TiffSequence(const SequenceFacts& facts, const WriteOptions& options)
@@ -305,12 +305,12 @@ class TiffSequence final : public SequenceWriter {
   }
 
  private:
-  static constexpr uint64_t kFirstPlace = 4;  // in the file's head
+  static constexpr uint64_t kFirstPlace = 4;  // in the file header
 
   const SequenceFacts facts_;
   const WriteOptions options_;
   ByteWriter out_;
-  uint32_t first_ = 0, next_ = 0;  // where the first directory is, and the last one names its next
+  uint32_t first_ = 0, next_ = 0;  // the first directory, and the last one's link
   uint16_t page_ = 0;
 };
 

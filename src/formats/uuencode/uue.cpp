@@ -1,5 +1,5 @@
-// UUEncoded graphics (UUE): uuencode.h has the text. The file within is decoded into a temporary
-// file, which its own row reads.
+// UUEncoded graphics (UUE); for the text format see uuencode.h. The embedded file is decoded to a
+// temporary file, which is then read by its own row.
 #include "formats/uuencode/uue.h"
 
 #include <algorithm>
@@ -23,7 +23,7 @@ namespace fotomill {
 
 namespace {
 
-constexpr size_t kShortExtension = 3;  // so much of a longer one tells the format as well
+constexpr size_t kShortExtension = 3;  // longer extensions match by their first characters
 
 bool IsWrapper(const FormatEntry& row) {
   return row.info == UueInfo || (row.flags & FMT_ARCHIVE) != 0;
@@ -33,7 +33,7 @@ bool IsUsable(const FormatEntry& row) {
   return row.canRead && !IsWrapper(row) && (row.present == nullptr || row.present());
 }
 
-// The rows of all families, in their order.
+// Visits the rows of all families, in order.
 template <typename Visit>
 void ForEachRow(Visit visit) {
   for (const std::span<const FormatEntry> family : {
@@ -45,8 +45,8 @@ void ForEachRow(Visit visit) {
   }
 }
 
-// The row that an extension without its dot selects: one of that name before one that shares three
-// letters. Null if there is none.
+// The row for an extension without its dot: an exact match, else one with the same first three
+// characters. Null if there is none.
 const FormatEntry* RowOfExtension(std::string_view extension) {
   const FormatEntry *exact = nullptr, *similar = nullptr;
   ForEachRow([&](const FormatEntry& row) {
@@ -68,7 +68,7 @@ bool Fits(const Signature& signature, std::span<const uint8_t> bytes) {
   return has(signature.offset, signature.bytes) && has(signature.secondOffset, signature.second);
 }
 
-// A file that was wrapped, on disk for its row.
+// The decoded file, on disk for its row.
 struct Unwrapped {
   std::string name;
   platform::TemporaryFile file;
@@ -76,14 +76,14 @@ struct Unwrapped {
   const FormatEntry* row = nullptr;
 };
 
-// A row reads the file when its `info` does.
+// A row accepts the file if its `info` succeeds.
 bool Takes(const FormatEntry& row, const ReadRequest& request) {
   const PicturePointer picture = NewPictureRecord();
   return IsUsable(row) && picture != nullptr && row.info(*picture, request) == Status::Ok;
 }
 
-// The row that takes the file, of those whose signature its bytes have the one with the longest.
-// Null if there is none.
+// The row that accepts the file, trying the longest matching signature first. Null if
+// there is none.
 const FormatEntry* RowOfContents(std::span<const uint8_t> bytes, const ReadRequest& request) {
   std::vector<std::pair<size_t, const FormatEntry*>> fitting;
   ForEachRow([&](const FormatEntry& row) {
@@ -110,7 +110,7 @@ Status Unwrap(const ReadRequest& request, uint64_t& fileSize, Unwrapped& inner) 
   if (extension.starts_with('.')) extension.remove_prefix(1);
   const FormatEntry* const named = RowOfExtension(extension);
   if (named != nullptr && IsWrapper(*named)) return Status::UnsupportedFormat;
-  // Some rows tell their variants by the extension, so the file has that of its row.
+  // Some codecs select variants by extension, so the file gets its row's.
   std::string ending(named == nullptr ? "" : ".");
   if (named != nullptr) ending += LowerCase(named->extension.view());
   if (!inner.file.Create(ending) || !inner.file.Write(decoded.bytes))
@@ -149,7 +149,7 @@ Status UueRead(PictureRecord& picture, const ReadRequest& request) {
   Unwrapped inner;
   uint64_t fileSize = 0;
   if (const Status status = Unwrap(request, fileSize, inner); status != Status::Ok) {
-    const ProgressScope progress(picture);  // otherwise the row inside has one
+    const ProgressScope progress(picture);  // otherwise the inner row has one
     return status;
   }
   RETURN_IF_BAD(inner.row->read(picture, inner.request));
@@ -162,7 +162,7 @@ Status UueWrite(PictureRecord& picture, const WriteOptions& options) {
   const std::string_view extension = colors ? ".jpg" : ".gif";
   platform::TemporaryFile file;
   if (picture.image.Empty() || !file.Create(extension)) {
-    const ProgressScope progress(picture);  // otherwise the row inside has one
+    const ProgressScope progress(picture);  // otherwise the inner row has one
     return picture.image.Empty() ? Status::MemoryAllocationError : Status::ErrorCreatingFile;
   }
   const PathText destination = picture.fileName;

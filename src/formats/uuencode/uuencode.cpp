@@ -12,10 +12,10 @@ namespace {
 
 constexpr std::string_view kBegin = "begin ", kBase64 = "begin-base64 ", kEnd = "end";
 constexpr size_t kBytesPerLine = 45;
-constexpr size_t kMostExtra = 2;  // characters behind the data of a line
+constexpr size_t kMostExtra = 2;  // characters after the data of a line
 constexpr size_t kFewestDigits = 3, kMostDigits = 4;
 
-// The next line without its end; `text` becomes the rest.
+// Removes and returns the first line of `text`, without its line ending.
 std::string_view TakeLine(std::string_view& text) {
   const size_t end = std::min(text.find('\n'), text.size());
   std::string_view line = text.substr(0, end);
@@ -24,7 +24,7 @@ std::string_view TakeLine(std::string_view& text) {
   return line;
 }
 
-// Whether a line begins a file; `name` is then its name without folders.
+// Whether a line starts a file; `name` is then its name without folders.
 bool ParseBegin(std::string_view line, std::string& name) {
   if (!line.starts_with(kBegin)) return false;
   line.remove_prefix(kBegin.size());
@@ -44,7 +44,7 @@ char CodeOf(uint32_t value) { return value == 0 ? '`' : static_cast<char>(' ' + 
 
 constexpr size_t CharactersFor(size_t bytes) { return (bytes + 2) / 3 * 4; }
 
-// What a line is.
+// Classification of a line.
 enum class LineKind { Data, Cut, Stray };
 LineKind KindOf(std::string_view line) {
   if (line.empty() || !std::ranges::all_of(line, IsCode)) return LineKind::Stray;
@@ -53,7 +53,7 @@ LineKind KindOf(std::string_view line) {
   return line.size() <= 1 + needed + kMostExtra ? LineKind::Data : LineKind::Stray;
 }
 
-// Appends the bytes of a line; characters that it lacks are 0.
+// Appends the bytes of a line; missing characters count as 0.
 void DecodeLine(std::string_view line, std::vector<uint8_t>& bytes) {
   const size_t count = ValueOf(line[0]), end = bytes.size() + count;
   const auto value = [&](size_t i) { return i < line.size() ? ValueOf(line[i]) : 0; };
@@ -81,7 +81,7 @@ Status DecodeUuencoded(std::span<const uint8_t> text, bool relaxed, UuencodedFil
     if (line == kEnd) return Status::Ok;
     if (kind == LineKind::Data || (kind == LineKind::Cut && relaxed)) {
       if (ValueOf(line[0]) == 0 && line.size() <= 1 + kMostExtra) return Status::Ok;
-      // Lines that are filled up give more than they take; the buffer is copied when it grows.
+      // Padded lines decode to more than their length; the buffer is copied when it grows.
       RETURN_IF_BAD(CheckFileMemory(3 * uint64_t{file.bytes.size()}));
       DecodeLine(line, file.bytes);
     } else if (!relaxed) {

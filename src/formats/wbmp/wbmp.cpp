@@ -1,11 +1,12 @@
 // Wireless bitmap (WBMP): black and white pictures for early mobile phones.
 //
 //   type, 0: uncompressed; a number as below
-//   fixed header, 1 byte: bit 7 says that further header bytes follow, which type 0 does not have
-//   width, height: numbers of 7 bits a byte, the highest first; bit 7 says that another byte
-//   follows rows from the top, (width + 7) / 8 bytes each; a set bit is white
+//   fixed header, 1 byte: bit 7 says that further header bytes follow, not used in type 0
+//   width, height: numbers of 7 bits per byte, most significant first; bit 7 is set if another byte
+//   follows
+//   rows, top first, (width + 7) / 8 bytes each; a set bit is white
 //
-// The reader ignores what follows the rows. The writer stores the darker of two colors as black.
+// The reader ignores data after the rows. The writer stores the darker of two colors as black.
 // Source: WAP Forum, "Wireless Application Environment Specification", WAP-237-WAEMT (2001).
 #include "formats/wbmp/wbmp.h"
 
@@ -22,7 +23,7 @@ namespace {
 
 constexpr uint64_t kLongestHeader = 16;
 constexpr uint8_t kMore = 0x80;
-constexpr uint8_t kExtended = 0x9f;  // bits of the fixed header that type 0 leaves clear
+constexpr uint8_t kExtended = 0x9f;  // bits of the fixed header that are 0 in type 0
 
 struct WbmpHeader {
   int32_t width = 0, height = 0;
@@ -31,7 +32,7 @@ struct WbmpHeader {
   size_t RowSize() const { return (static_cast<size_t>(width) + 7) / 8; }
 };
 
-// A number of at most 31 bits; 0, which no size is, when it has more.
+// A number of at most 31 bits; 0, which is not a valid size, if it is larger.
 int32_t ReadNumber(ByteReader& bytes) {
   uint32_t number = 0;
   for (int i = 0; i < 5; ++i) {

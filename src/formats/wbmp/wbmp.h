@@ -6,8 +6,8 @@
 
 namespace fotomill {
 
-// Wireless bitmaps. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) when data are
-// cut short, MemoryAllocationError (6), UnsupportedFormat (8) for types other than 0.
+// Wireless bitmaps. Statuses: FileOpenError (1), DamagedFile (2), FileReadError (3) if truncated,
+// MemoryAllocationError (6), UnsupportedFormat (8) for types other than 0.
 Status WbmpInfo(PictureRecord& picture, const ReadRequest& request);
 Status WbmpRead(PictureRecord& picture, const ReadRequest& request);
 // Also ErrorCreatingFile (10), ErrorWritingFile (11), TooManyColors (12) for pictures deeper than 1

@@ -1,19 +1,19 @@
 // WebP, little-endian, pixels decoded and encoded by libwebp.
 //
-//   "RIFF", length, "WEBP", then chunks of name, length and data, padded to an even length:
+//   "RIFF", size, "WEBP", then chunks of name, size and data, padded to an even size:
 //   "VP8 " lossy pixels, or "VP8L" lossless ones; or first of all
 //   "VP8X" flags (1 byte: 2 animation, 4 XMP, 8 EXIF, 16 alpha, 32 ICC), 3 bytes 0, width - 1,
-//   height - 1 (3 bytes each) "ICCP", "ANIM" background and loops, "ANMF" a frame, "ALPH" and "VP8
-//   ", "EXIF", "XMP " ANMF: x / 2, y / 2, width - 1, height - 1, duration (3 bytes each), flags,
-//   then the frame's ALPH, VP8 or VP8L chunk
+//          height - 1 (3 bytes each)
+//   "ICCP", "ANIM" background and loops, "ANMF" a frame, "ALPH" and "VP8 ", "EXIF", "XMP "
+//   ANMF:  x / 2, y / 2, width - 1, height - 1, duration (3 bytes each), flags, then the frame's
+//          ALPH, VP8 or VP8L chunk
 //
-// Everything becomes 24 bits, with an alpha plane where the file has alpha. Frames of an animation
-// are its pages, each as it is on the canvas after those before it. EXIF, XMP and ICC profile
-// travel with the picture.
+// Everything becomes 24 bits, with an alpha plane if the file has alpha. Frames of an animation are
+// pages, each composed with the preceding ones on the canvas. EXIF, XMP and ICC profile are kept.
 //
-// The writer makes lossy files of quality WebPQualityFactor, or lossless ones with WebPLossless,
-// which keep every value, also beneath transparent pixels. With WebPAllowMixed it makes both and
-// keeps the smaller. Source: RFC 9649 (2024).
+// The writer creates lossy files with quality WebPQualityFactor, or with WebPLossless lossless
+// ones, which keep every value, even below transparent pixels. With WebPAllowMixed it tries both
+// and keeps the smaller one. Source: RFC 9649 (2024).
 #include "formats/webp/webp.h"
 
 #include <webp/decode.h>
@@ -38,7 +38,7 @@ namespace fotomill {
 namespace {
 
 constexpr uint8_t kXmpFlag = 4, kExifFlag = 8, kAlphaFlag = 16, kIccFlag = 32;
-// flags of a frame: what becomes of it, and how it is put there
+// frame flags: disposal and blending
 constexpr uint8_t kClearAfterwards = 1, kReplace = 2;
 constexpr size_t kMostFrames = 1 << 16;
 constexpr int kLossy = 1, kLossless = 2;  // WebPBitstreamFeatures::format
@@ -48,16 +48,16 @@ struct WebpFrame {
   int32_t width = 0, height = 0;
   int32_t duration = 0;  // milliseconds
   uint8_t flags = 0;
-  // what the library decodes: the whole file, or the frame's chunks
+  // input of the library: the whole file, or the frame's chunks
   std::span<const uint8_t> pixels;
 };
 
 struct WebpFile {
   int32_t width = 0, height = 0;  // of the canvas
   bool alpha = false;
-  int format = 0;                 // of the library, 0 for an animation
-  uint16_t loops = 0;             // of an animation: how often it is played, 0 for ever
-  std::vector<WebpFrame> frames;  // one of a still picture
+  int format = 0;                 // from the library, 0 for an animation
+  uint16_t loops = 0;             // number of times an animation plays, 0 for endless
+  std::vector<WebpFrame> frames;  // one for a still picture
   std::span<const uint8_t> icc, exif, xmp;
 };
 
@@ -66,7 +66,7 @@ uint32_t Le24(ByteReader& bytes) {
   return low | static_cast<uint32_t>(bytes.U8()) << 16;
 }
 
-// What the library says of a stream of its own: chunks without the RIFF head, or a whole file.
+// The status for a library error on a stream: chunks without the RIFF header, or a whole file.
 Status StatusOf(VP8StatusCode code) {
   switch (code) {
     case VP8_STATUS_OK: return Status::Ok;
@@ -90,8 +90,8 @@ void TakeFrame(std::span<const uint8_t> chunk, WebpFile& file) {
   if (file.frames.size() < kMostFrames) file.frames.push_back(frame);
 }
 
-// The chunks beside the pixels. A chunk that is cut short is taken as far as it goes: the library
-// tells what is missing.
+// Collects the chunks other than pixels. A truncated chunk is used as far as it goes: the library
+// reports what is missing.
 void WalkChunks(std::span<const uint8_t> data, WebpFile& file) {
   RiffWalk walk(data);
   for (RiffPlace place; walk.Next(place);) {
@@ -105,14 +105,14 @@ void WalkChunks(std::span<const uint8_t> data, WebpFile& file) {
   }
 }
 
-// Asks the library for the size of an animation's frame, which must lie on the canvas.
+// Gets the size of an animation's frame from the library, and checks that it is on the canvas.
 Status MeasureFrame(WebpFile& file, WebpFrame& frame) {
   WebPBitstreamFeatures features;
   RETURN_IF_BAD(StatusOf(WebPGetFeatures(frame.pixels.data(), frame.pixels.size(), &features)));
   const bool inside = int64_t{frame.left} + features.width <= file.width &&
                       int64_t{frame.top} + features.height <= file.height;
   if (!inside || features.has_animation != 0) return Status::DamagedFile;
-  frame.width = features.width;  // only now: a frame that has a size is drawn
+  frame.width = features.width;  // last: a frame with a size can be drawn
   frame.height = features.height;
   file.alpha = file.alpha || features.has_alpha != 0;
   return Status::Ok;
@@ -134,7 +134,7 @@ Status ParseFile(std::span<const uint8_t> data, WebpFile& file) {
     return Status::Ok;
   }
   if (file.frames.empty()) return Status::FileReadError;
-  // What the frames leave open of the canvas is transparent; the first one tells.
+  // Areas not covered by frames are transparent; checking the first one is sufficient.
   RETURN_IF_BAD(MeasureFrame(file, file.frames[0]));
   file.alpha =
       file.alpha || file.frames[0].width < file.width || file.frames[0].height < file.height;
@@ -155,14 +155,14 @@ void Describe(const WebpFile& file, PictureRecord& picture) {
   picture.imageBytes = EstimateImageBytes(file.width, file.height, 24);
   MakeDefaultPalette(&picture.palette, nullptr, kDisplayPalette);
   picture.metadata = {};
-  // some programs put it in front, as in JPEG
+  // some programs include the JPEG signature
   const bool headed = ByteReader(file.exif).Match(kExifHead);
   TakeBlock(headed ? file.exif.subspan(kExifHead.size()) : file.exif, picture.metadata.exif);
   TakeBlock(file.xmp, picture.metadata.xmp);
   TakeBlock(file.icc, picture.metadata.icc);
 }
 
-// Puts a row of a frame onto the canvas: in the place of what is there, or over it.
+// Draws a row of a frame onto the canvas, replacing or blending.
 void PutRow(const uint8_t* source, int32_t width, bool replace, uint8_t* color, uint8_t* alpha) {
   for (int32_t x = 0; x < width; ++x, source += 4, color += 3, ++alpha) {
     const uint32_t over = source[3], under = *alpha * (255 - over) / 255;
@@ -187,8 +187,8 @@ void ClearFrame(const WebpFrame& frame, Canvas& target) {
   }
 }
 
-// Bytes that the library holds while it decodes a frame: lossless pixels and alpha as a whole,
-// others row by row.
+// Memory that the library needs to decode a frame: lossless pixels and alpha as a whole, others row
+// by row.
 uint64_t DecoderBytes(const WebpFrame& frame) {
   WebPBitstreamFeatures features;
   if (WebPGetFeatures(frame.pixels.data(), frame.pixels.size(), &features) != VP8_STATUS_OK)
@@ -199,7 +199,7 @@ uint64_t DecoderBytes(const WebpFrame& frame) {
   return features.has_alpha != 0 ? 5 * pixels : 0;
 }
 
-// With alpha, a frame is decoded to four bytes a pixel and put in its place.
+// With alpha, a frame is decoded to four bytes per pixel and then drawn.
 Status ReadFrame(const WebpFrame& frame, Canvas& target) {
   const size_t stride = 4 * static_cast<size_t>(frame.width);
   RETURN_IF_BAD(CheckFileMemory(target.image.Bytes().size() + target.alpha.Bytes().size() + stride * static_cast<size_t>(frame.height) +
@@ -222,7 +222,7 @@ Status ReadFrame(const WebpFrame& frame, Canvas& target) {
   return Status::Ok;
 }
 
-// Puts a frame on the canvas that the frames before it have left.
+// Draws a frame on the canvas of the previous ones.
 Status DrawFrame(WebpFile& file, size_t index, Canvas& target) {
   WebpFrame& frame = file.frames[index];
   if (frame.width == 0) RETURN_IF_BAD(MeasureFrame(file, frame));
@@ -231,7 +231,7 @@ Status DrawFrame(WebpFile& file, size_t index, Canvas& target) {
   return ReadFrame(frame, target);
 }
 
-// The canvas as it is with the last of `frames` frames on it.
+// The canvas after drawing `frames` frames.
 Status ReadWithAlpha(WebpFile& file, int32_t frames, const PictureRecord& picture, Canvas& target) {
   for (int32_t i = 0; i < frames; ++i) {
     RETURN_IF_BAD(DrawFrame(file, static_cast<size_t>(i), target));
@@ -240,7 +240,7 @@ Status ReadWithAlpha(WebpFile& file, int32_t frames, const PictureRecord& pictur
   return Status::Ok;
 }
 
-// An animation that does not tell of alpha may have it anyway; mostly it has not.
+// An animation without an alpha flag may still have alpha, but usually has not.
 void DropOpaqueAlpha(Canvas& target) {
   for (int32_t y = 0; y < target.alpha.Height(); ++y) {
     const uint8_t* row = target.alpha.Row(y).data();
@@ -250,7 +250,7 @@ void DropOpaqueAlpha(Canvas& target) {
   target.alpha.Free();
 }
 
-// Without alpha the library fills the picture's own rows, which are stored bottom row first.
+// Without alpha, decodes directly into the picture's rows, which are stored bottom-up.
 Status ReadOpaque(const WebpFile& file, const PictureRecord& picture, Canvas& target) {
   RETURN_IF_BAD(CheckFileMemory(target.image.Bytes().size() + DecoderBytes(file.frames[0])));
   WebPDecoderConfig config;
@@ -269,7 +269,7 @@ struct IncrementalDeleter {
   void operator()(WebPIDecoder* decoder) const { WebPIDelete(decoder); }
 };
 
-// The rows of a still picture that ends early, straight into the canvas. `rows`: how many.
+// Decodes the rows of a truncated still picture directly into the canvas. `rows`: how many.
 Status ReadPart(const WebpFile& file, Canvas& target, int32_t& rows) {
   const WebpFrame& frame = file.frames[0];
   const size_t stride = 4 * static_cast<size_t>(frame.width);
@@ -344,7 +344,7 @@ Status WebpRead(PictureRecord& picture, const ReadRequest& request) {
   if (request.page < 0 || request.page >= picture.pageCount) return Status::NoImages;
   const bool canvas = file.alpha || file.frames.size() > 1;
   Canvas target;
-  // zeroed pages count only once the frame is drawn
+  // zeroed pages use no memory until the frame is drawn
   const uint64_t rows = PackedRowBytes(file.width, file.height, 24);
   RETURN_IF_BAD(CheckFileMemory(canvas ? rows + rows / 3 : rows));
   RETURN_IF_BAD(NewPackedImage(file.width, file.height, &picture.palette, 24, target.image));

@@ -1,5 +1,5 @@
 // The WebP writer: still pictures, and animations whose frames are the part of the canvas that
-// differs from the frame before, put there without blending.
+// differs from the previous frame, stored without blending.
 #include <webp/encode.h>
 
 #include <algorithm>
@@ -22,7 +22,7 @@ namespace fotomill {
 namespace {
 
 constexpr uint8_t kAnimationFlag = 2, kXmpFlag = 4, kExifFlag = 8, kAlphaFlag = 16, kIccFlag = 32;
-constexpr uint8_t kReplace = 2;  // flag of a frame: it is not blended
+constexpr uint8_t kReplace = 2;  // frame flag: no blending
 constexpr int32_t kLongestDelay = (1 << 24) - 1;
 constexpr size_t kExtendedSize = 18;  // of the chunk VP8X
 
@@ -30,7 +30,7 @@ struct PictureDeleter {
   void operator()(WebPPicture* picture) const { WebPPictureFree(picture); }
 };
 
-// The color of each pixel as blue, green, red, alpha.
+// The pixels of a row as blue, green, red, alpha.
 void FillRow(const PictureRecord& picture, int32_t y, uint32_t* target) {
   const PackedImage& image = picture.image;
   const uint8_t* row = image.Row(y).data();
@@ -45,10 +45,10 @@ void FillRow(const PictureRecord& picture, int32_t y, uint32_t* target) {
   }
 }
 
-// What the encoder holds for a pixel, at most: measured on noise, which takes the most.
+// Maximum encoder memory per pixel, measured with noise, the worst case.
 constexpr uint64_t kLosslessBytes = 32, kLossyBytes = 17, kLossyLeastBytes = 8;
 
-// Refuses what takes too much memory. Lossy encoding has a way that takes longer and less.
+// Rejects pictures that need too much memory. Lossy encoding has a slower mode that needs less.
 Status ChooseMemory(const PictureRecord& picture, WebPConfig& config) {
   const uint64_t pixels =
       static_cast<uint64_t>(picture.image.Width()) * static_cast<uint64_t>(picture.image.Height());
@@ -100,7 +100,7 @@ void WriteChunk(ByteWriter& out, std::string_view name, std::span<const uint8_t>
 
 uint64_t ChunkBytes(uint64_t data) { return data == 0 ? 0 : 8 + data + data % 2; }
 
-// The chunks of one encoded picture, without those around them.
+// The pixel chunks of an encoded picture.
 std::span<const uint8_t> PixelChunks(std::span<const uint8_t> encoded) {
   const auto chunks = encoded.subspan(std::min<size_t>(kRiffHead, encoded.size()));
   const bool extended =
@@ -108,7 +108,7 @@ std::span<const uint8_t> PixelChunks(std::span<const uint8_t> encoded) {
   return extended ? chunks.subspan(kExtendedSize) : chunks;
 }
 
-// The encoder's file, with the chunks of metadata around its pixels where there are any.
+// Writes the encoder's file, adding metadata chunks if there are any.
 void WriteFile(ByteWriter& out, const PictureRecord& picture, const PictureMetadata& metadata,
                std::span<const uint8_t> encoded) {
   const auto chunks = PixelChunks(encoded);
@@ -161,7 +161,7 @@ class WebpSequence final : public SequenceWriter {
       return Status::UnsuitableImage;
     Canvas frame{std::move(picture.image), std::move(picture.alpha)};
     Rectangle area = first ? Rectangle{0, 0, width, height} : ChangedArea(screen_, frame);
-    // places are stored as halves
+    // offsets are stored divided by two
     area = {area.x & ~1, area.y & ~1, area.width + (area.x & 1), area.height + (area.y & 1)};
     RETURN_IF_BAD(CutImage(frame.image, area, picture.image));
     RETURN_IF_BAD(CutImage(frame.alpha, area, picture.alpha));
@@ -184,7 +184,7 @@ class WebpSequence final : public SequenceWriter {
     if (options_.KeepsMetadata()) metadata_ = picture.metadata;
     metadata_.icc = picture.metadata.icc;
     out_.Text("RIFF");
-    out_.Le32(0);  // when it is known
+    out_.Le32(0);  // the size, patched later
     out_.Text("WEBPVP8X");
     out_.Le32(10);
     out_.Le32(kAnimationFlag | kAlphaFlag | (metadata_.icc.empty() ? 0u : kIccFlag) |
@@ -194,7 +194,7 @@ class WebpSequence final : public SequenceWriter {
     WriteChunk(out_, "ICCP", metadata_.icc);
     out_.Text("ANIM");
     out_.Le32(6);
-    out_.Le32(0);  // transparent around the frames
+    out_.Le32(0);  // transparent background
     out_.Le16(static_cast<uint16_t>(std::clamp(facts_.rounds, 0, int32_t{UINT16_MAX})));
     return NewCanvas(picture.image.Width(), picture.image.Height(), screen_);
   }
@@ -217,7 +217,7 @@ class WebpSequence final : public SequenceWriter {
   const WriteOptions options_;
   ByteWriter out_;
   PictureMetadata metadata_;  // of the first picture
-  Canvas screen_;             // as the frames written so far leave it
+  Canvas screen_;             // after the frames written so far
 };
 
 }  // namespace
@@ -238,7 +238,7 @@ Status WebpWrite(PictureRecord& picture, const WriteOptions& options) {
   const bool useOther = other.writer.size > 0 && other.writer.size < encoded.writer.size;
   const WebPMemoryWriter& chosen = useOther ? other.writer : encoded.writer;
   const std::span<const uint8_t> bytes(chosen.mem, chosen.size);
-  // the profile goes along whatever becomes of the rest
+  // the profile is always kept
   PictureMetadata kept;
   if (options.KeepsMetadata()) kept = picture.metadata;
   kept.icc = picture.metadata.icc;

@@ -3,13 +3,13 @@
 //   offset size  field
 //        0    4  FF "WPC"
 //        4    4  offset of the first record
-//        8    2  product 1, type of the file 0x16
+//        8    2  product 1, file type 0x16
 //       10    2  version: 1.0 or 2.0
-//       12    2  key of the encryption, 0: none
+//       12    2  encryption key, 0: none
 //       14    2  reserved
 //
-// Records of version 1 are a type, a size and data; in version 2 a class comes before the type and
-// a number of further records before the size. Sizes are 1 byte; or FF and 2 bytes; or FF and 4
+// Records of version 1 are a type, a size and data; in version 2 the type is preceded by a class
+// and the size by a number of further records. Sizes are 1 byte; or FF and 2 bytes; or FF and 4
 // bytes, the high word first, with its highest bit set.
 //
 //   version 1                                   version 2
@@ -19,15 +19,15 @@
 //        red, green, blue of each                    blue, alpha of each
 //    0B  bitmap: width, height, depth,           0E  bitmap: width, height, color format 1,
 //        resolutions 2 each, then rows               compression 1 (0 none, 1 runs), then rows
-//    14  the same behind 10 bytes of place
+//    14  the same after 10 bytes of position
 //    10  end                                     02  end
 //
-// Depths are 1, 2, 4 and 8 bits. Color formats are 1 to 4 for these depths, 6 for 5 bits a color, 8
-// red, green, blue, 9 with alpha, 12 gray. Rows come from the top; wpg_rows.h has their coding.
+// Depths are 1, 2, 4 and 8 bits. Color formats are 1 to 4 for these depths, 6 for 5 bits per color,
+// 8 red, green, blue, 9 with alpha, 12 gray. Rows are top first; for their coding see wpg_rows.h.
 //
 // Without a color map the colors are those of VGA; with 1 bit black and white. The reader ignores
-// alpha, and the two bytes of a unit's size that some programs leave before uncompressed rows. The
-// writer makes version 1 with a color map. Source: J. Murray and W. vanRyper, "Encyclopedia of
+// alpha, and the two bytes of a unit size that some programs write before uncompressed rows. The
+// writer creates version 1 with a color map. Source: J. Murray and W. vanRyper, "Encyclopedia of
 // Graphics File Formats", 2nd edition (1996), with WordPerfect Corporation's text; Corel,
 // "WordPerfect Graphics Format", software developer's kit.
 #include "formats/wordperfect/wpg.h"
@@ -58,7 +58,7 @@ constexpr uint32_t kResolution = 75;
 constexpr uint8_t kUnitSizeToken = 0x7d;
 constexpr int kMostRepeats = 255;
 
-// How a pixel of a bitmap is stored.
+// Pixel format of a bitmap.
 enum class Pixels { Index, Gray, Rgb555, Rgb, Rgba, Unknown };
 
 struct Bitmap {
@@ -73,20 +73,20 @@ struct Bitmap {
   size_t RowSize() const {
     return (static_cast<size_t>(width) * static_cast<size_t>(bits) + 7) / 8;
   }
-  // Of the picture.
+  // Of the resulting picture.
   int32_t Depth() const { return pixels == Pixels::Index || pixels == Pixels::Gray ? bits : 24; }
 };
 
-// The 256 colors that VGA starts with: sixteen, as many grays, then 24 hues in three saturations at
-// three intensities; 8 are black.
+// The default 256-color VGA palette: 16 colors, 16 grays, then 24 hues in three saturations at
+// three intensities; the last 8 are black.
 Palette VgaColors() {
   constexpr uint8_t kGrays[16] = {0, 5, 8, 11, 14, 17, 20, 24, 28, 32, 36, 40, 45, 50, 56, 63};
-  // from none to all of a color, of 63
+  // levels from minimum to maximum of a color, out of 63
   constexpr uint8_t kLevels[9][5] = {
       {0, 16, 31, 47, 63}, {31, 39, 47, 55, 63}, {45, 49, 54, 58, 63},
       {0, 7, 14, 21, 28},  {14, 17, 21, 24, 28}, {20, 22, 24, 26, 28},
       {0, 4, 8, 12, 16},   {8, 10, 12, 14, 16},  {11, 12, 13, 15, 16}};
-  // one color around the circle of hues, which begins at blue
+  // red around the hue circle, starting at blue
   constexpr uint8_t kRed[24] = {0, 1, 2, 3, 4, 4, 4, 4, 4, 4, 4, 4,
                                 4, 3, 2, 1, 0, 0, 0, 0, 0, 0, 0, 0};
   constexpr size_t kBrown = 6;
@@ -102,7 +102,7 @@ Palette VgaColors() {
   for (size_t i = 0; i < 16; ++i) std::fill_n(&palette[3 * (16 + i)], 3, widen(kGrays[i]));
   for (size_t i = 0; i < 9 * size_t{24}; ++i) {
     for (size_t c = 0; c < 3; ++c) {
-      // green follows red by a third of the circle, blue green
+      // green follows red by a third of the circle, and blue follows green
       const uint8_t level = kRed[(i % 24 + 24 - 8 * c) % 24];
       palette[3 * (32 + i) + c] = widen(kLevels[i / 24][level]);
     }
@@ -110,7 +110,7 @@ Palette VgaColors() {
   return palette;
 }
 
-// The size of a record, or the number of its further ones.
+// The size of a record, or the number of its sub-records.
 uint64_t ReadSize(ByteReader& bytes) {
   const uint8_t first = bytes.U8();
   if (first < 0xff) return first;
@@ -118,7 +118,7 @@ uint64_t ReadSize(ByteReader& bytes) {
   return (word & 0x8000) == 0 ? word : (word & 0x7fff) << 16 | bytes.Le16();
 }
 
-// The colors of a map, `size` bytes each.
+// Reads the colors of a map, `size` bytes each.
 void ReadColors(std::span<const uint8_t> data, size_t size, Palette& palette) {
   ByteReader bytes(data);
   const size_t first = bytes.Le16(), count = bytes.Le16();
@@ -171,13 +171,13 @@ bool ReadBitmap2(std::span<const uint8_t> data, Bitmap& bitmap) {
   return bytes.Ok();
 }
 
-// Keeps the larger bitmap, of equal ones the deeper.
+// Keeps the larger bitmap, or if equal, the deeper one.
 void KeepBetter(const Bitmap& found, Bitmap& best) {
   if (found.width < 1 || found.height < 1) return;
   if (std::pair(found.Area(), found.bits) > std::pair(best.Area(), best.bits)) best = found;
 }
 
-// Walks the records of version 1; `palette` are the colors so far.
+// Walks the records of version 1; `palette` is the palette so far.
 void FindBitmap1(ByteReader& bytes, Palette& palette, Bitmap& best) {
   while (bytes.Left() > 0) {
     const uint8_t type = bytes.U8();
@@ -253,7 +253,7 @@ Status DescribePicture(const platform::FileView& file, const ReadRequest&, Bitma
   return Status::Ok;
 }
 
-// A row of the picture, or of 4-bit pixels from 2-bit ones.
+// Converts a row; 2-bit pixels become 4-bit ones.
 void PutRow(std::span<const uint8_t> source, const Bitmap& bitmap, std::span<uint8_t> row) {
   const auto width = static_cast<size_t>(bitmap.width);
   if (bitmap.pixels == Pixels::Rgb) {
@@ -297,7 +297,7 @@ Status Decode(platform::FileView& file, const Bitmap& bitmap, const PictureRecor
   return Status::Ok;
 }
 
-// The size of a record that is known only behind its data takes this form.
+// Size of the size field of a record whose size is patched later.
 constexpr size_t kLongSize = 5;
 std::array<uint8_t, kLongSize> LongSize(uint64_t size) {
   return {0xff, static_cast<uint8_t>(size >> 16), static_cast<uint8_t>(0x80 | size >> 24),
@@ -371,7 +371,7 @@ Status WpgWrite(PictureRecord& picture, const WriteOptions& options) {
   ByteWriter out;
   if (!out.Create(picture.fileName.c_str())) return Status::ErrorCreatingFile;
   WriteHead(out, picture);
-  const uint64_t data = out.Position() - 10;  // with its five fields
+  const uint64_t data = out.Position() - 10;  // including its five fields
   RETURN_IF_BAD(WriteRows(out, picture));
   const uint64_t size = out.Position() - data;
   if (size > INT32_MAX) return Status::UnsuitableImage;

@@ -94,7 +94,7 @@ void EncodeWpgRow(std::span<const uint8_t> row, std::vector<uint8_t>& code) {
       bytes = bytes.subspan(part.size());
     }
   };
-  size_t plain = 0;  // where the bytes that no run has taken begin
+  size_t plain = 0;  // start of the pending literal bytes
   for (size_t x = 0; x < row.size();) {
     const size_t end = std::min(row.size(), x + kMostInToken);
     size_t next = x + 1;

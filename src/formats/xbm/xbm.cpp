@@ -5,20 +5,20 @@
 //   static char NAME_text_bits[] = {
 //   0x01, 0x80, 0xff, 0x7f}
 //
-// A value holds eight pixels of a row, the leftmost in its lowest bit; a set bit is black.
+// A value has eight pixels of a row, the leftmost in its lowest bit; a set bit is black.
 //
-// Reads the sizes from lines that contain "#define" and "width" or "height" anywhere; when a line
-// has both, because the picture is named after one of them, the later word counts. The values begin
-// behind the first line that contains "bits" but no "#define"; each is the two characters behind
-// the next lower-case x, of which any that is no digit counts as 0. Lines are taken in pieces of at
-// most 260 characters.
+// The sizes are read from lines that contain "#define" and "width" or "height" anywhere; if a line
+// has both, because the picture's name contains one of them, the later word applies. The values
+// start after the first line that contains "bits" but no "#define"; each is the two characters
+// after the next lowercase x, where characters other than hex digits count as 0. Lines are read in
+// pieces of at most 260 characters.
 //
-// Where the width is no multiple of 8, the picture is at the end of each row of values in place
-// of its beginning: reading drops the row's first pixels and shows its padding, writing puts black
-// padding in front. What this program wrote it reads back as it was; pictures of other programs
-// appear moved to the left.
+// If the width is not a multiple of 8, the picture is expected at the end of each row of values
+// instead of at its start: reading drops the row's first pixels and shows its padding, writing puts
+// black padding first. Files written by this program round-trip; pictures of other programs are
+// shifted to the left.
 //
-// Writes twelve values a line, without a semicolon behind the brace.
+// Writes twelve values per line, without a semicolon after the brace.
 //
 // Source: X Consortium, "Xlib - C Language X Interface", XReadBitmapFile (1988).
 #include "formats/xbm/xbm.h"
@@ -41,14 +41,14 @@ namespace {
 
 constexpr size_t kLineCharacters = 260;
 constexpr size_t kValuesPerLine = 12;
-constexpr size_t kValueBytes = 3;  // the least a value takes: x and two digits
+constexpr size_t kValueBytes = 3;  // minimum text per value: x and two digits
 
 struct XbmSize {
-  int64_t width = 0;  // as the file claims until CheckSize
+  int64_t width = 0;  // unchecked until CheckSize
   int64_t height = 0;
 };
 
-// The value of a hexadecimal digit, 0 for any other character.
+// The value of a hex digit, 0 for any other character.
 constexpr std::array<uint8_t, 256> MakeDigitValues() {
   std::array<uint8_t, 256> values{};
   for (uint8_t i = 0; i < 10; ++i) values['0' + i] = i;
@@ -57,7 +57,7 @@ constexpr std::array<uint8_t, 256> MakeDigitValues() {
 }
 constexpr std::array<uint8_t, 256> kDigitValues = MakeDigitValues();
 
-// Reads a text front to back. A scan for something that is not there ends at the limit for texts.
+// Reads a text sequentially. Searches stop at the limit for texts.
 class XbmText {
  public:
   explicit XbmText(std::span<const uint8_t> bytes)
@@ -65,7 +65,7 @@ class XbmText {
         end_(next_ + bytes.size()),
         start_(next_) {}
 
-  // The next line with its line end, or the next piece of a long one. False at the end.
+  // The next line including its line ending, or the next piece of a long one. False at the end.
   bool Line(std::string_view& line) {
     const uint64_t scanned = static_cast<uint64_t>(next_ - start_);
     if (next_ == end_ || scanned >= limits.textScanBytes) return false;
@@ -79,7 +79,7 @@ class XbmText {
     return true;
   }
 
-  // The next value. False when the text ends first.
+  // The next value. False if the text ends first.
   bool Value(uint8_t& value) {
     const char* const scanEnd =
         next_ + std::min(static_cast<uint64_t>(end_ - next_), limits.textScanBytes);
@@ -104,8 +104,8 @@ bool Contains(std::string_view text, std::string_view word) {
   return text.find(word) != std::string_view::npos;
 }
 
-// The number behind the word that starts at `position`: past the next blank or tab and all that
-// follow it.
+// The number after the word at `position`: skips to the next blank or tab and past all
+// that follow it.
 int64_t NumberBehind(std::string_view line, size_t position) {
   constexpr std::string_view kBlanks = " \t";
   const size_t wordEnd = std::min(line.find_first_of(kBlanks, position), line.size());
@@ -119,7 +119,7 @@ XbmSize ParseSize(std::span<const uint8_t> bytes) {
   std::string_view line;
   while ((size.width == 0 || size.height == 0) && text.Line(line)) {
     if (!Contains(line, "#define")) continue;
-    // 0: not there
+    // 0: not found
     const size_t lastWidth = line.rfind("width") + 1, lastHeight = line.rfind("height") + 1;
     if (lastWidth > lastHeight) size.width = NumberBehind(line, line.find("width"));
     if (lastHeight > lastWidth) size.height = NumberBehind(line, line.find("height"));
@@ -151,7 +151,7 @@ constexpr std::array<uint8_t, 256> MakeMirrorTable() {
 }
 constexpr std::array<uint8_t, 256> kMirrored = MakeMirrorTable();
 
-// Reads one row of `width` pixels and clears its padding. False when the text ends first.
+// Reads one row of `width` pixels and clears its padding. False if the text ends first.
 bool DecodeRow(XbmText& text, size_t width, std::span<uint8_t> row) {
   const size_t count = (width + 7) / 8;
   const size_t dropped = 8 * count - width;  // pixels
@@ -168,10 +168,10 @@ bool DecodeRow(XbmText& text, size_t width, std::span<uint8_t> row) {
   return true;
 }
 
-// The values of a row of `width` pixels, `values` as long as they are many. Padding bits of `row`
-// may hold anything.
+// The values of a row of `width` pixels; `values` has the size of the result. Padding bits of `row`
+// are undefined.
 void EncodeRow(std::span<const uint8_t> row, size_t width, std::span<uint8_t> values) {
-  const size_t padding = 8 * values.size() - width;  // pixels in front
+  const size_t padding = 8 * values.size() - width;  // pixels before the row
   unsigned previous = 0;
   for (size_t i = 0; i < values.size(); ++i) {
     const unsigned pixels = row[i];
@@ -180,7 +180,7 @@ void EncodeRow(std::span<const uint8_t> row, size_t width, std::span<uint8_t> va
   }
 }
 
-// A C identifier of a file's name: what C does not allow in one becomes "_".
+// Converts a file's name to a C identifier: characters not allowed in C become "_".
 std::string IdentifierOf(std::string_view path) {
   std::string name = LowerCase(platform::SplitPath(path).base);
   for (char& c : name) {
@@ -194,7 +194,7 @@ void WriteLine(ByteWriter& out, std::string_view text) {
   out.Text(platform::kLineEnd);
 }
 
-// Writes values one after the other. A comma comes between two, and every twelfth ends its line.
+// Writes values separated by commas, twelve per line.
 class XbmValueWriter {
  public:
   XbmValueWriter(ByteWriter& out, uint64_t total) : out_(out), left_(total) {}
@@ -232,14 +232,14 @@ class XbmValueWriter {
   size_t inLine_ = 0;
 };
 
-// Parses the sizes and fills the record's facts.
+// Parses the sizes and fills in the record.
 Status DescribePicture(const platform::FileView& file, const ReadRequest&, XbmSize& size,
                        PictureRecord& picture) {
   size = ParseSize(file.Bytes());
   RETURN_IF_BAD(CheckSize(size));
   SetPlainFacts(picture, static_cast<int32_t>(size.width), static_cast<int32_t>(size.height), 1);
   MakeDefaultPalette(&picture.palette, nullptr, kBlackAndWhitePalette);
-  // rows of other lengths mean another thing elsewhere
+  // other programs read rows of other widths differently
   picture.simplified = picture.width % 8 != 0 || picture.height % 8 != 0;
   return Status::Ok;
 }

@@ -11,7 +11,7 @@ namespace fotomill {
 // Statuses as WarpPicture.
 
 // Rotates about the center. Multiples of 90 move whole pixels and keep the depth. With `grow` the
-// size becomes |w cos| + |h sin|, rounded up, and likewise the height; else it is unchanged.
+// width becomes |w cos| + |h sin|, rounded up, and the height likewise; else the size is unchanged.
 Status RotatePicture(PictureRecord& picture, double angle, bool grow, const WarpOptions& options,
                      const Work& work);
 
