@@ -13,7 +13,7 @@ namespace {
 
 enum class Content { Photo, Flat };
 
-// Bytes of a row: a gradient with a little noise, or areas of 200 equal bytes.
+// Row data: a gradient with a little noise, or areas of 200 equal bytes.
 PicturePointer MakePicture(Content content, int32_t depth, Size size) {
   PicturePointer picture = NewPictureRecord();
   picture->width = size.width;
@@ -56,7 +56,7 @@ void Encode(benchmark::State& state, const char* extension, Content content, int
   for (auto _ : state) {
     if (row.write(*picture, {}) != Status::Ok) state.SkipWithError("cannot write");
     state.PauseTiming();
-    std::filesystem::remove(name);  // a file that is replaced would be synced
+    std::filesystem::remove(name);  // replacing a file would sync it
     state.ResumeTiming();
   }
   SetBytes(state, picture->image);

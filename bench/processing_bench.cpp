@@ -1,5 +1,5 @@
-// Scaling, color reduction, turning and flattening of a picture of 6 megapixels, in source pixels
-// per second.
+// Scaling, color reduction, rotation and flattening of a 6-megapixel picture, in source
+// pixels per second.
 #include <benchmark/benchmark.h>
 
 #include <cmath>
@@ -14,7 +14,7 @@ namespace {
 
 constexpr int32_t kWidth = 3000, kHeight = 2000;
 
-// Waves of many colors with some noise, about as hard as a photograph.
+// Colored waves with some noise, about as complex as a photograph.
 PicturePointer MakePhotograph() {
   PicturePointer picture = NewPictureRecord();
   if (NewPackedImage(kWidth, kHeight, nullptr, 24, picture->image) != Status::Ok) std::abort();

@@ -1,5 +1,4 @@
-// An EXIF block: the walk with every text, the raw copies of its values, and the changes that
-// writers make to it.
+// An EXIF block: walking it with all texts, raw copies of values, and the edits made by writers.
 
 #include <cstdlib>
 #include <string>
@@ -14,8 +13,7 @@ namespace {
 
 using namespace fotomill;
 
-// Small limits: the walk meets each of them now and then, and hostile inputs cost no more time than
-// others.
+// Small limits: they are all reached occasionally, and hostile inputs are not slower than others.
 [[maybe_unused]] const bool limitsSet = [] {
   limits.exifDirectories = 16;
   limits.exifEntries = 512;
@@ -24,7 +22,7 @@ using namespace fotomill;
   return true;
 }();
 
-// Reads every byte that it is handed, so that the sanitizers see each of them.
+// Reads every byte it receives, so that the sanitizers check each of them.
 class Reader : public ExifSink {
  public:
   void Directory(int32_t, std::string_view label) override { Read(label); }

@@ -1,5 +1,5 @@
-// A picture file in which an EXIF block is looked for. The search reads files, so each input
-// becomes one.
+// Finding the EXIF block in a picture file. The search reads files, so each input is
+// written to one.
 
 #include <cstdlib>
 

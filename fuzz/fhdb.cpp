@@ -9,8 +9,8 @@
 #include "settings/settings.h"
 #include "support/scratch_file.h"
 
-// What was read from a history file is what is read after it was saved, and recording adds one
-// entry in front.
+// A history file must read back the same after saving, and recording must add one entry
+// at the front.
 
 namespace {
 

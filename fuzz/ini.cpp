@@ -32,7 +32,7 @@ Entries EntriesOf(std::string_view text, std::string_view section,
   return entries;
 }
 
-// Any file may set any key; what is stored stays within its variable.
+// Any file may set any key; stored values must stay within their variables.
 void TryValues(std::string_view text) {
   settings = defaultSettings;
   IniReader reader(text, "Fotomill");
@@ -52,7 +52,7 @@ void TryValues(std::string_view text) {
   }
 }
 
-// An edit changes its keys and nothing else, and a second time nothing at all.
+// An edit must change its keys only, and repeating it must change nothing.
 void TryEdits(std::string_view text) {
   const std::vector<IniEdit> edits{
       {"JpegCompression", "5"}, {"NewKey", " new "}, {"PrefixCrop", std::nullopt}};

@@ -7,8 +7,8 @@ namespace {
 
 using namespace fotomill;
 
-// A file that could be turned is a sound head of a JPEG file, and its EXIF, whatever it was, can be
-// edited again.
+// A rotated file must have a valid JPEG header, and its EXIF, whatever it was, must
+// be editable again.
 void TurnFile(std::span<const uint8_t> file) {
   const uint8_t choice = file.empty() ? uint8_t{0} : file.back();
   std::vector<uint8_t> made;

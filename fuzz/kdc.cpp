@@ -4,7 +4,7 @@
 
 #include <cstdlib>
 
-// The codec's decoder runs apart, which is this program started again.
+// The decoder runs in a worker process, which is this program started again.
 extern "C" int LLVMFuzzerInitialize(int* count, char*** arguments) {
   if (const auto status =
           fotomill::platform::ServeApart(*count, *arguments, fotomill::ChildTasks()))

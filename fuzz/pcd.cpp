@@ -1,5 +1,5 @@
-// The first byte chooses: a whole file, whose end is filled with zeros up to the smallest picture,
-// or code tables and deltas for planes of a few samples, which take much less time.
+// The first byte selects: a whole file, zero-padded to the size of the smallest picture, or code
+// tables and deltas for tiny planes, which are much faster.
 
 #include <algorithm>
 #include <span>

@@ -12,14 +12,15 @@ void Require(bool holds) {
   if (!holds) std::abort();
 }
 
-// What the configuration holds; the input's second half, so that keys hold anything as well.
+// The configuration, taken from the second half of the input, so that keys contain
+// anything as well.
 KeyValues KeysFrom(std::string_view text) {
   const std::string value(text.substr(text.size() - text.size() / 2));
   return [value](std::string_view) { return value; };
 }
 
-// A recipe is read or its mistakes are named, each in one line of the text; one that was read
-// prints as text that reads and prints the same.
+// A recipe must be parsed or its errors reported, each on one line; the printed form of a parsed
+// one must parse and print the same.
 void TryRecipe(std::string_view text, const KeyValues& keys) {
   Recipe recipe;
   const std::vector<Mistake> mistakes = ReadRecipe(text, keys, recipe);

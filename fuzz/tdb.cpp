@@ -6,8 +6,8 @@
 #include "platform/files.h"
 #include "support/scratch_file.h"
 
-// The input is a database whose pixels are left out: a header, and 64 bytes for each record: magic,
-// path, volume, flags. What is left behind the last is the beginning of one more.
+// The input is a database without pixels: a header, and 64 bytes per record: magic, path, volume,
+// flags. The remainder is a truncated record.
 
 namespace fotomill {
 namespace {
@@ -35,7 +35,7 @@ std::vector<uint8_t> Expand(const uint8_t* data, size_t size) {
   return file;
 }
 
-// Every path is found as a scan over the records would find it.
+// Lookups must find the same as a scan over the records.
 void CompareLookups(ThumbnailDatabase& database, int64_t count) {
   DatabaseRecord wanted, record;
   for (int64_t i = 0; i < count; ++i) {

@@ -2,8 +2,7 @@
 #include "catalog/thumbnails/thumbnail_file.h"
 #include "support/scratch_file.h"
 
-// A thumbnail file reads as a whole record or not at all, and what reads can be drawn and written
-// back.
+// A thumbnail file must read completely or fail, and what was read must be drawable and writable.
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
   using namespace fotomill;
   using fuzz::Require;
@@ -23,7 +22,7 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
   }
   static PackedImage bitmap;
   if (bitmap.Empty()) Require(NewPackedImage(180, 180, nullptr, 24, bitmap) == Status::Ok);
-  // Enlarging says little about the input and takes most of the time.
+  // Enlarging tests little but takes most of the time.
   const uint32_t flags = data[size / 2] & (size % 64 == 0 ? 0xff : ~kDrawLargeView);
   Require(DrawThumbnailRecord(bitmap, any, static_cast<int8_t>(data[size - 1]), 0, flags, {}));
   ThumbnailRecord again;

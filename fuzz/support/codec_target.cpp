@@ -19,7 +19,7 @@ uint32_t Hash(const uint8_t* data, size_t size) {
   return hash;
 }
 
-// Some writers decide by the extension of their file.
+// Some writers depend on the extension of the file.
 void Write(const WriteOperation write, PictureRecord& picture, const char* extension,
            const EncodeOptions& encode) {
   static const std::string path = ScratchPath("out.") + extension;

@@ -9,7 +9,7 @@
 
 namespace fotomill::fuzz {
 
-// A file in memory that every run fills anew.
+// A file in memory, rewritten in every run.
 class MemoryFile {
  public:
   MemoryFile()
@@ -25,8 +25,8 @@ class MemoryFile {
   std::string path_;
 };
 
-// A name of this process for files that a target needs on disk. The fuzzer leaves without calling
-// exit handlers: who starts it makes the folder and takes it away again.
+// A path, specific to this process, for files that a target needs on disk. The fuzzer exits without
+// running exit handlers, so the starting script creates and removes the folder.
 inline std::string ScratchPath(const char* name) {
   const char* const folder = std::getenv("TMPDIR");
   return std::string(folder == nullptr ? "/tmp" : folder) + "/" + name + "-" +

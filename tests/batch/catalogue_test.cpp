@@ -35,7 +35,7 @@ TEST(CatalogueDrawing, Places) {
   for (const auto& row : rows)
     EXPECT_EQ(PicturePlace(look, CellPlace(look, 0), row.width, row.height), row.place)
         << row.width;
-  look.pageWidth = look.pageHeight = 0;  // the same margin on all sides of the grid
+  look.pageWidth = look.pageHeight = 0;  // equal margins on all sides of the grid
   EXPECT_EQ(PageSize(look), (Rectangle{0, 0, 228, 327}));
   EXPECT_EQ(CellPlace(look, 0), (Rectangle{12, 12, 96, 80}));
 }
@@ -94,7 +94,7 @@ TEST(CatalogueDrawing, NamesStayInTheirBand) {
         gray += pixel != 0xFFFFFF;
       }
     }
-    // The room ends at row 12 + 2 + 96; the band is 3 to 18 below it.
+    // The cell ends at row 12 + 2 + 96; the text is 3 to 18 below it.
     EXPECT_TRUE(top >= 113 && bottom < 128 && left >= 14 && right < 110) << text;
     EXPECT_NEAR(left - 14, 109 - right, 3) << text;
     EXPECT_GT(gray, 0) << text;
@@ -109,7 +109,7 @@ TEST(CataloguePage, FirstFreeNames) {
   BatchJob job = NewBatchJob();
   job.formatIndex = FindFormatByName("x.bmp");
   job.destinationFolder = folder.Path();
-  // is for names that follow a source's, and makes no page replace another
+  // is for names derived from a source, and must not make pages replace each other
   job.naming.extensionCase = 1;
   job.overwrite.prompt = false;
   const PicturePointer page = MakePicture(4, 4, 24);
@@ -154,7 +154,7 @@ TEST(CataloguePage, SheetsAreTheSameWithAnyNumberOfJobs) {
   for (size_t i = 0; i < 3; ++i) EXPECT_TRUE(sheets[i] == sheets[i + 3] && !sheets[i].empty()) << i;
 }
 
-// Aborts once a given file is drawn.
+// Aborts when a given file has been drawn.
 class AbortingBox : public ProgressBox {
  public:
   AbortingBox(const BatchJob& job, std::string last) : job_(job), last_(std::move(last)) {}

@@ -10,7 +10,7 @@
 namespace fotomill::test {
 namespace {
 
-// Gives one answer after the other, and keeps what it was asked.
+// Gives scripted answers, and records the questions.
 class ScriptedPrompts : public Prompts {
  public:
   std::vector<OverwriteAnswer> answers;
@@ -38,7 +38,7 @@ int32_t RowOf(std::string_view extension) {
   return FindFormatByName("x." + std::string(extension));
 }
 
-// The outcome in short: the path with "!" in front when it replaces a file, or why there is none.
+// The outcome in short: the path, prefixed by "!" if it replaces a file, or why there is none.
 std::string Settle(BatchJob& job, const std::set<std::string>& there, const std::string& source) {
   job.formatIndex = RowOf("tif");
   Destination destination;
@@ -63,7 +63,8 @@ std::string Settle(BatchJob& job, const std::set<std::string>& there, const std:
   return (destination.replace ? destination.recycle ? "!~" : "!" : "") + destination.path;
 }
 
-// A name that no one can tell about is neither free nor taken, and no search goes on forever.
+// If the system cannot tell whether a name exists, it counts as neither free nor taken, and
+// searches end.
 TEST(DestinationName, SearchesForNamesEnd) {
   BatchJob job;
   EXPECT_EQ(Settle(job, {}, "unknown.bmp"), "Error creating file.");
@@ -221,7 +222,7 @@ TEST(DestinationName, TypedNamesAndVariants) {
   prompts.names = {"bad\nname", "x/../../up", "..", std::string(300, 'l'), "else.where"};
   EXPECT_EQ(Settle(job, {}, "in/a.BMP"), "in/else.TIF");
   prompts.names = {"/other/b.tif"};
-  EXPECT_EQ(Settle(job, {"/other/b.tif"}, "in/a.bmp"), "skipped");  // the overwrite prompt was cancelled
+  EXPECT_EQ(Settle(job, {"/other/b.tif"}, "in/a.bmp"), "skipped");  // the prompt was canceled
   EXPECT_EQ(Settle(job, {}, "in/a.bmp"), "skipped");
   job.naming.askName = false;
 

@@ -54,7 +54,7 @@ TEST(Progress, PlacesOfTheBoxAndItsControls) {
   const ProgressSettings tall{}, fixed{.optimizeWindow = false};
   EXPECT_EQ(ProgressBoxPlace(1001, 700, tall), (Rectangle{290, 8, 420, 684}));
   EXPECT_EQ(ProgressBoxPlace(1001, 700, fixed), (Rectangle{290, 135, 420, 430}));
-  EXPECT_EQ(ProgressBoxPlace(401, 301, fixed), (Rectangle{-9, -64, 420, 430}));  // halves go towards zero
+  EXPECT_EQ(ProgressBoxPlace(401, 301, fixed), (Rectangle{-9, -64, 420, 430}));  // toward 0
   const ProgressLayout layout = LayOutProgressBox(413, 401, tall);
   EXPECT_EQ(layout.list, (Rectangle{5, 5, 403, 337}));
   EXPECT_EQ(layout.status, (Rectangle{8, 351, 397, 16}));

@@ -10,14 +10,14 @@
 namespace fotomill::test {
 namespace {
 
-// Files whose names depend on what happens to other files of the run have to wait for those.
+// Files whose names depend on other files of the run must wait for those.
 TEST(RunNames, OnlyFilesThatNobodyElseConcernsGoAhead) {
-  // sources and outputs; the first one is asked about
+  // sources and outputs; the prompt is about the first one
   using Plan = std::vector<std::pair<const char*, const char*>>;
   const struct {
     const char* name;
     Plan plan;
-    // no one else is concerned; another's output may come to lie on the source
+    // independent of the others; its source may be overwritten by another's output
     bool alone, overwritten;
   } rows[] = {
       {"names apart", {{"/x/a.bmp", "/out/a.pcx"}, {"/x/b.bmp", "/out/b.pcx"}}, true, false},

@@ -55,7 +55,7 @@ TEST_F(Run, SeveralAtATimeGiveWhatOneAfterTheOtherGives) {
     fs::create_directory(In(folder));
     for (const char* name : {"a", "a [1]", "b", "c [2]", "c"}) {
       const std::string path = In(folder) + "/" + name + ".bmp";
-      // Sizes that take different times, so that threads overtake each other.
+      // Sizes with different processing times, so that threads overtake each other.
       const int32_t side = 10 + static_cast<int32_t>(files.size() * 7919 % 13) * 60;
       WriteBytes(path, BitmapFile(side, side, 24));
       files.push_back({path, {}, Status::Ok, {}});
@@ -155,8 +155,8 @@ TEST_F(Run, AVariantMayBeTooLongWhereItsNameWasNot) {
 }
 
 TEST_F(Run, ASourceWaitsForTheOutputThatTakesItsPlace) {
-  // Each file's output is the next one's source, and replaces it: the last output holds the first
-  // picture.
+  // Each file's output is the next one's source and replaces it: the last output has
+  // the first picture.
   for (const uint32_t jobs : {1u, 4u}) {
     fs::remove(In("a [1].bmp"));
     WriteBytes(In("a.dib"), BitmapFile(300, 300, 24));
@@ -168,7 +168,7 @@ TEST_F(Run, ASourceWaitsForTheOutputThatTakesItsPlace) {
     job.destinationFolder.clear();
     job.overwrite.prompt = false;
     ASSERT_EQ(RunBatch(files, {.jobs = jobs}, job), Status::Ok);
-    EXPECT_EQ(job.progress.Lines()[0].text, In("a.dib") + " -> " + In("a [1].bmp"));  // a source is not replaced
+    EXPECT_EQ(job.progress.Lines()[0].text, In("a.dib") + " -> " + In("a [1].bmp"));  // sources stay
     EXPECT_EQ(job.progress.Lines()[1].text, In("a.bmp") + " -> " + In("a.bmp"));
     EXPECT_EQ(ReadBytes(In("a [1].bmp")).size(), ReadBytes(In("a.dib")).size());
   }
@@ -188,7 +188,7 @@ TEST_F(Run, NeverMorePicturesThanJobsAndNothingBegunAfterAbort) {
       most = std::max<int>(most, ++now);
       if (++begun == 20) {
         job.stop.Stop();
-        // another job, such as the preview of a dialog, has nothing to do with this one's end
+        // ending one job does not affect another, such as the preview of a dialog
         BatchJob other = NewJob();
         EXPECT_EQ(RunBatch({}, {.dryRun = true}, other), Status::Ok);
       }
@@ -199,7 +199,7 @@ TEST_F(Run, NeverMorePicturesThanJobsAndNothingBegunAfterAbort) {
     ASSERT_EQ(RunBatch(files, {.transform = transform, .jobs = jobs}, job), Status::Ok);
     EXPECT_LE(most, static_cast<int>(jobs));
     EXPECT_LE(begun, 20 + static_cast<int>(jobs));
-    // of the others that were in work, nothing is left
+    // files in progress leave nothing behind
     const auto whole = static_cast<uint32_t>(Outputs().size());
     EXPECT_LE(whole, static_cast<uint32_t>(begun));
     EXPECT_GE(whole + jobs, static_cast<uint32_t>(begun));

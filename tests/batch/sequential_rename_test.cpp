@@ -30,7 +30,7 @@ class Rename : public testing::Test {
     std::filesystem::create_directory(folder_.Path("p"));
     for (const std::string& name : names) WriteText(folder_.Path("p/" + name), name);
   }
-  // Each file of the folder as "NAME=CONTENTS"; the contents are its first name.
+  // Each file of the folder as "NAME=CONTENTS"; the contents are its original name.
   std::vector<std::string> There() const {
     std::vector<std::string> files;
     for (const auto& entry : std::filesystem::directory_iterator(folder_.Path("p"))) {
@@ -47,7 +47,7 @@ class Rename : public testing::Test {
     RunRename(files, options, job);
     return job;
   }
-  // With the rules of the settings.
+  // With the rules from the settings.
   BatchJob RunAsSet(const std::vector<std::string>& names, bool dryRun = false) const {
     return RunOn(names, {.rules = SequentialRenameRulesFromSettings(), .dryRun = dryRun});
   }
@@ -59,7 +59,7 @@ class Rename : public testing::Test {
 TEST_F(Rename, Names) {
   const struct {
     const char* name;
-    std::vector<std::string> there, renamed;  // the first of them are renamed
+    std::vector<std::string> there, renamed;  // the first of these are renamed
     int32_t number, increment, attempts;
     bool hyphen, prefix, skip;
     std::vector<std::string> after;
@@ -112,7 +112,7 @@ TEST_F(Rename, Names) {
        false,
        {"PICTURE0002.jpg=PICTURE0001.jpg"},
        3},
-      // The counter is raised before it is compared: with 3 there are two tries.
+      // The counter is incremented before the check: with 3 there are two attempts.
       {"attempts",
        {"PICTURE0001.jpg", "PICTURE0002.jpg", "a.jpg"},
        {"a.jpg"},
@@ -149,7 +149,7 @@ TEST_F(Rename, Names) {
   }
 }
 
-// A run that waits for others begins when the settings may long have changed.
+// The settings may change while a run waits for others.
 TEST_F(Rename, RunsByTheRulesThatItWasStartedWith) {
   Make({"a.jpg", "b.jpg"});
   settings.SequentialRenameIncrement = 5;
@@ -176,14 +176,13 @@ TEST_F(Rename, TakenBack) {
   EXPECT_TRUE(undo.errors);
   EXPECT_THAT(There(), ElementsAre("PICTURE0002.jpg=b.jpg", "a.jpg=a.jpg", "b.jpg=new", "c.jpg=c.jpg"));
   std::filesystem::remove(folder_.Path("p/b.jpg"));
-  ASSERT_TRUE(UndoRename({}, false, undo));  // what could not be taken back is still known
+  ASSERT_TRUE(UndoRename({}, false, undo));  // entries that failed can be undone later
   EXPECT_FALSE(undo.errors);
   EXPECT_THAT(There(), ElementsAre("a.jpg=a.jpg", "b.jpg=b.jpg", "c.jpg=c.jpg"));
   EXPECT_TRUE(ReadRenameLog()->files.empty());
 }
 
-// A rename is noted before it is done: a run that is killed in between has either lost nothing or
-// not begun.
+// Renames are logged first: a run that is killed in between has either lost nothing or not started.
 TEST_F(Rename, KilledRunsCanBeTakenBack) {
   Make({"a.jpg", "b.jpg"});
   const std::string a = folder_.Path("p/a.jpg"), b = folder_.Path("p/b.jpg");
@@ -232,8 +231,7 @@ TEST_F(Rename, RunsAtTheSameTimeAreBothTakenBack) {
   ASSERT_TRUE(UndoRename({}, false, undo));
   EXPECT_FALSE(undo.errors);
   EXPECT_THAT(There(), ElementsAre("a.jpg=a.jpg", "b.jpg=b.jpg"));
-  // A run after them begins a new log; one that goes on while part of it is taken back loses
-  // nothing.
+  // The next run starts a new log; a run that continues while part of it is undone loses nothing.
   RenameLog third;
   rename(third, "p/a.jpg", "p/1.jpg");
   rename(third, "p/b.jpg", "p/2.jpg");

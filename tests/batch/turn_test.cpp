@@ -34,7 +34,7 @@ TEST(Turn, FilesChangeOnlyWhereNothingIsLost) {
   const struct {
     const char* name;
     std::vector<uint8_t> bytes;
-    const char* hint;  // null: it is turned
+    const char* hint;  // null: it is rotated
   } rows[] = {
       {"a.jpg", Encode(JpegWrite, *picture), nullptr},
       {"b.png", Encode(PngWrite, *picture), nullptr},
@@ -72,7 +72,7 @@ TEST(Turn, FilesChangeOnlyWhereNothingIsLost) {
     ASSERT_EQ(LoadPicture({.fileName = folder.Path(std::string("before-") + row.name)}, before), Status::Ok);
     ASSERT_EQ(LoadPicture({.fileName = path}, after), Status::Ok);
     ASSERT_EQ(after->image.Width(), before->image.Height());
-    // decoding a turned block rounds otherwise
+    // decoding a rotated block rounds differently
     if (std::string_view(row.name) == "a.jpg") continue;
     for (int32_t x = 0; x < before->image.Width(); ++x) {
       EXPECT_EQ(before->image.PixelAt(x, 1), after->image.PixelAt(after->image.Width() - 2, x));
@@ -147,8 +147,8 @@ TEST(Turn, SelectionsKeepTheirNamesAndTheirOldFiles) {
   EXPECT_TRUE(fs::is_symlink(folder.Path("link.bmp")));
   EXPECT_EQ(ReadBytes(folder.Path("c.bmp")), bitmap);
 
-  // Elsewhere outputs keep clear of each other and of what is there; the second turn gives the
-  // first picture back.
+  // In another folder, outputs avoid each other and existing files; the second rotation restores
+  // the first picture.
   function = {.request = {.turn = Orientation::HalfTurn}};
   BatchJob other;
   other.destinationFolder = folder.Path("out");
@@ -158,7 +158,7 @@ TEST(Turn, SelectionsKeepTheirNamesAndTheirOldFiles) {
   ASSERT_EQ(LoadPicture({.fileName = folder.Path("c.bmp")}, once), Status::Ok);
   EXPECT_TRUE(SamePixels(once->image, twice->image));
   EXPECT_TRUE(fs::exists(folder.Path("out/a [1].bmp")));
-  // A turn that comes to nothing leaves the file alone.
+  // A rotation by nothing leaves the file alone.
   EXPECT_FALSE(TurnPictureFile(folder.Path("c.bmp"), folder.Path("c.bmp"), {}, {}, {}).changed);
 }
 
@@ -180,7 +180,7 @@ TEST(Turn, WhateverFailsTheOldFileIsThere) {
     return true;
   };
   EXPECT_NE(TurnPictureFile(path, path, {.turn = Orientation::HalfTurn}, {}, options).status, Status::Ok);
-  // Neither does a text go that a new file would not have.
+  // Nor is a text dropped that a new file would not have.
   std::vector<uint8_t> written = Encode(PngWrite, *PatternPicture(9, 5, 24));
   const std::vector<uint8_t> author = Hex("00000009 74455874 417574686F72004D65 00000000");
   written.insert(written.end() - 12, author.begin(), author.end());

@@ -23,7 +23,7 @@ using testing::IsEmpty;
 
 constexpr int64_t kNow = 1'700'000'000;
 
-// A data folder of its own and files to record, each as long as its number.
+// A fresh data folder and files to record, each as long as its number.
 class FileHistory : public testing::Test {
  protected:
   FileHistory() {
@@ -47,7 +47,7 @@ class FileHistory : public testing::Test {
   std::string Line(const std::string& name, const std::string& rest) const {
     return "\tPATH:" + folder_.Path(name) + rest + "\n";
   }
-  // "NAME FUNCTION ACCESSED" of each entry in list order, with the times before now.
+  // "NAME FUNCTION ACCESSED" of each entry in list order, with times relative to now.
   std::vector<std::string> List() const {
     std::vector<std::string> list;
     for (size_t i = 0; i < FileHistoryCount(); ++i) {
@@ -103,7 +103,7 @@ TEST_F(FileHistory, IsLimitedByCountOrByDays) {
   settings.FileHistoryWindowCount = 3;
   EXPECT_TRUE(Record(File("old"), 0, 1000));
   EXPECT_THAT(List(), ElementsAre("f24 0 -76", "f23 0 -77", "f22 0 -78"));
-  EXPECT_TRUE(Record(File("old"), 0, 10));  // comes back after it was cut off
+  EXPECT_TRUE(Record(File("old"), 0, 10));  // back after it was cut off
   EXPECT_THAT(List(), ElementsAre("old 0 -10", "f24 0 -76", "f23 0 -77"));
   settings.FileHistoryWindowType = choice::kLimitDays;
   EXPECT_TRUE(Record(File("limit"), 0, 30 * 86400));
@@ -237,7 +237,7 @@ TEST_F(FileHistory, SwitchedOffIsDeletedAtTheNextSave) {
   EXPECT_FALSE(std::filesystem::exists(Store()));
 }
 
-// The list grows to 128 x 128 slots and more, of which only those with entries may cost memory.
+// The list grows to 128 x 128 slots and more, but only slots with entries may use memory.
 TEST_F(FileHistory, GrowsWithoutTouchingWhatItReserves) {
   settings.FileHistoryWindowType = choice::kLimitDays;
   const std::string file = File("a");
@@ -254,7 +254,7 @@ TEST_F(FileHistory, GrowsWithoutTouchingWhatItReserves) {
   ASSERT_EQ(FileHistoryCount(), 300u);
   for (size_t i = 1; i < 300; ++i)
     EXPECT_GE(FileHistoryAt(i - 1).accessed, FileHistoryAt(i).accessed);
-#ifndef __SANITIZE_ADDRESS__  // the sanitizer keeps books of what is reserved, in memory of its own
+#ifndef __SANITIZE_ADDRESS__  // the sanitizer's shadow of reserved memory takes memory, too
   EXPECT_LT(after.ru_maxrss - before.ru_maxrss, 4 * 1024) << "kilobytes";
 #endif
 }
@@ -270,7 +270,7 @@ TEST_F(FileHistory, SlotsHoldTheThumbnailsOfTheirFiles) {
     const ThumbnailRecord* const record = FileHistoryThumbnail(index);
     return record == nullptr ? -1 : record->bytes[27911];
   };
-  for (int i = 0; i < 130; ++i) {  // one time of growth
+  for (int i = 0; i < 130; ++i) {  // grows once
     EXPECT_TRUE(Record(File("f" + std::to_string(i) + ".bmp"), 0, i));
     if (i == 1) {
       put("f0", 10);

@@ -17,7 +17,7 @@
 namespace fotomill::test {
 namespace {
 
-// Soft hills, different for each seed.
+// Smooth hills, different for each seed.
 PicturePointer Landscape(int32_t width, int32_t height, int32_t seed, int32_t brighter = 0) {
   return MakePicture(width, height, [=](int32_t x, int32_t y) {
     const double u = 1.0 * x / width, v = 1.0 * y / height;
@@ -152,7 +152,7 @@ TEST(SimilarGroups, OfAHundredThousandTakeSeconds) {
     for (size_t way = 0; way < hashes.size(); ++way)
       hashes[way] = PictureHash{Scatter(i, static_cast<int32_t>(way))} << 32 |
                     Scatter(static_cast<int32_t>(way), -i);
-    if (i % 4 == 0) hashes[0] = 12345;  // plain pictures look alike
+    if (i % 4 == 0) hashes[0] = 12345;  // as for plain pictures
     pictures.push_back(hashes);
   }
   const auto begun = std::chrono::steady_clock::now();

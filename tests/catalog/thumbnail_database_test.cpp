@@ -35,7 +35,7 @@ class Database : public testing::Test {
   }
   std::string Path() const { return folder_.Path("Fotomill.tdb"); }
   uint64_t Size() const { return std::filesystem::file_size(Path()); }
-  // "PATH VOLUME PIXEL", with an "x" behind what is deleted; the pixel tells thumbnails apart.
+  // "PATH VOLUME PIXEL", followed by "x" if deleted; the pixel identifies the thumbnail.
   std::vector<std::string> Records() const {
     ThumbnailDatabase database;
     DatabaseHeader header;
@@ -122,8 +122,8 @@ TEST_F(Database, NamesVolumes) {
   }
 }
 
-// Every lookup gives what a scan from the first record gives, whatever happened before, also
-// through another handle.
+// Every lookup must return the same as a scan from the first record, whatever happened before, and
+// through any handle.
 TEST_F(Database, FindsWhatAScanFinds) {
   ThumbnailDatabase one, two;
   ASSERT_EQ(one.OpenThumbnailDatabase(Path(), true), Opened::Done);
@@ -173,8 +173,7 @@ TEST_F(Database, FindsWhatAScanFinds) {
         break;
       default: break;
     }
-    // A handle on a database that was compacted through another one is opened again by its next
-    // change.
+    // After the database was compacted through another handle, the next change reopens it.
     ThumbnailDatabase fresh;
     ASSERT_EQ(fresh.OpenThumbnailDatabase(Path(), false), Opened::Done);
     ThumbnailRecord found;
@@ -206,7 +205,7 @@ TEST_F(Database, ComparesExtensionsAsItIsTold) {
   EXPECT_EQ(found.bytes[300], 1);
   EXPECT_FALSE(database.Find("/p.y/a.jpg", "v", found));
   browserOptions = kCompareExtensions;
-  // By exact path whatever the volume, deleted ones too.
+  // By exact path on any volume, including deleted ones.
   ASSERT_EQ(database.Delete("/p.x/a.png"), 2);
   ASSERT_TRUE(FindDatabaseThumbnail(found, "/p.x/a.png", Path()));
   EXPECT_EQ(found.bytes[300], 2);
@@ -217,7 +216,7 @@ TEST_F(Database, ComparesExtensionsAsItIsTold) {
   EXPECT_FALSE(FindDatabaseThumbnail(found, "/p.x/a.png", Path())) << "a record before it is none";
 }
 
-// Lookups are right whatever has become of the saved index.
+// Lookups are right whatever happened to the saved index.
 TEST_F(Database, ASavedIndexIsOnlyAHelp) {
   constexpr int kMany = 1200;
   const std::string index = Path() + ".index";
@@ -235,7 +234,7 @@ TEST_F(Database, ASavedIndexIsOnlyAHelp) {
              found.bytes[300] == number % 256;
     };
     if (!open(database)) return false;
-    const bool inFile = find();  // the second time with all of it loaded
+    const bool inFile = find();  // the second time after loading everything
     EXPECT_EQ(find(), inFile);
     return inFile;
   };
@@ -249,7 +248,7 @@ TEST_F(Database, ASavedIndexIsOnlyAHelp) {
   EXPECT_TRUE(finds(0) && finds(kMany - 1) && !finds(kMany));
   EXPECT_EQ(ReadBytes(index), good);
   std::vector<uint8_t> bad = good;
-  // every hash, no checksum
+  // all hashes, but not the checksum
   for (size_t cell = 48; cell < bad.size(); cell += 8) bad[cell] ^= (cell - 48) % 512 != 0;
   WriteBytes(index, bad);
   EXPECT_TRUE(finds(7));
@@ -263,7 +262,7 @@ TEST_F(Database, ASavedIndexIsOnlyAHelp) {
     EXPECT_EQ(database.Delete("/p/8"), 1);
   }
   EXPECT_TRUE(!finds(7) && !finds(8) && finds(9));
-  WriteBytes(index, good);  // of a state that is gone
+  WriteBytes(index, good);  // outdated
   EXPECT_TRUE(!finds(7) && !finds(8) && finds(9));
   WriteText(index, "precious");
   EXPECT_TRUE(finds(9));
@@ -274,7 +273,7 @@ TEST(ThumbnailIndex, KnowsEveryRecordInOrderThroughChanges) {
   ThumbnailIndex index;
   std::vector<uint32_t> model;
   std::mt19937 random(3);
-  // Few hashes, and some that share a home, so that searches run into one another.
+  // Few hashes, and some with the same home slot, so that probe sequences overlap.
   const auto hash = [&] {
     return random() % 3 == 0 ? 0 : static_cast<uint32_t>(random() % 40 + 1) << (random() % 2 * 27);
   };
@@ -452,8 +451,8 @@ TEST_F(Database, TwoProcessesAppendAndCompact) {
   EXPECT_EQ(Records().size(), 2u * kEach);
 }
 
-// Records whose append was reported are there, and the database is readable, whenever the writer is
-// killed.
+// Records whose append was reported exist, and the database is readable, whenever the
+// writer is killed.
 TEST_F(Database, AKilledWriterLosesNothingReported) {
   for (int round = 0; round < 12; ++round) {
     int reported[2];

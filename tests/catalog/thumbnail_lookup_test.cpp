@@ -20,7 +20,7 @@
 namespace fotomill::test {
 namespace {
 
-// A small record whose pixels all hold `value`.
+// A small record with all pixels equal to `value`.
 ThumbnailRecord Flat(uint8_t value) {
   ThumbnailRecord record;
   record.Sign();
@@ -58,7 +58,7 @@ TEST(DrawThumbnail, FillsTheSquareOfItsFlags) {
       {"the large view wins", record, 6, 1, 176, 255, 255},
       {"large record", large, 0, 0, 176, 255, 0},
       {"large record, large view", large, 4, 0, 176, 255, 0},
-      // 48 of 176: a new pixel covers 3 2/3 old ones, the white one is 9 of 121
+      // 48 from 176: a new pixel covers 3 2/3 old ones, the white one is 9 of 121
       {"large record, half size", large, 2, 0, 48, 19, 0},
   };
   for (const auto& row : rows) {
@@ -74,7 +74,7 @@ TEST(DrawThumbnail, FillsTheSquareOfItsFlags) {
     EXPECT_EQ(canvas.PixelAt(1, row.side + 2), 0x070707);
     EXPECT_EQ(canvas.PixelAt(0, 2), 0x070707);
   }
-  // 176 of 96: the second pixel covers the first old one to 11 - 6 parts of 6.
+  // 176 from 96: the second pixel covers the first old one by 11 - 6 parts of 6.
   PackedImage canvas = Canvas(176);
   ASSERT_TRUE(DrawThumbnailRecord(canvas, record, 0, 0, kDrawLargeView, {.fastZoom = true}));
   EXPECT_EQ(canvas.PixelAt(1, 0), (255 * 5 + 3) / 6 * 0x010101);
@@ -111,7 +111,7 @@ TEST(DrawThumbnail, PlaceholdersAreTwoPicturesOnTheMatte) {
 }
 
 TEST(SystemThumbnail, IsNamedAfterThePicture) {
-  // The example of the standard itself.
+  // The example in the standard.
   const std::string uri = FileUri("/home/jens/photos/me.png");
   EXPECT_EQ(uri, "file:///home/jens/photos/me.png");
   EXPECT_EQ(Md5Text(std::span(reinterpret_cast<const uint8_t*>(uri.data()), uri.size())), "c6ee772d9e49320e97ec29a7eb5b1697");
@@ -123,7 +123,7 @@ TEST(SystemThumbnail, IsNamedAfterThePicture) {
   EXPECT_EQ(Md5Text({}), "d41d8cd98f00b204e9800998ecf8427e");
 }
 
-// A picture, and what may hold its thumbnail.
+// A picture, and possible sources of its thumbnail.
 class Lookup : public testing::Test {
  protected:
   Lookup() : cache_("XDG_CACHE_HOME", folder_.Path("cache")) {
@@ -131,7 +131,7 @@ class Lookup : public testing::Test {
     std::filesystem::create_directories(folder_.Path("cache/thumbnails/large"));
   }
 
-  // Puts a PNG of 200 x 100 (or as given) with its texts where the system keeps its thumbnails.
+  // Stores a PNG of 200 x 100 (or as given) with its texts as the system's thumbnail.
   void PutSystemThumbnail(int64_t late, const std::string& uri, int32_t width = 200,
                           int32_t height = 100) const {
     std::vector<uint8_t> file = Encode(PngWrite, *PatternPicture(width, height, 24));
@@ -157,7 +157,7 @@ class Lookup : public testing::Test {
     const std::vector<uint8_t> crc = number(static_cast<uint32_t>(
         crc32(0, reinterpret_cast<const Bytef*>(chunk.data()), static_cast<uInt>(chunk.size()))));
     bytes.insert(bytes.end(), crc.begin(), crc.end());
-    file.insert(file.begin() + 33, bytes.begin(), bytes.end());  // behind the header chunk
+    file.insert(file.begin() + 33, bytes.begin(), bytes.end());  // after the header chunk
   }
 
   TemporaryFolder folder_;
@@ -185,10 +185,10 @@ TEST_F(Lookup, TakesTheSystemsThumbnailWhileItIsValid) {
     EXPECT_EQ(ReadSystemThumbnail(picture_, 0xabcdef, record), row.valid);
   }
   EXPECT_TRUE(record.HasMagic("tHNL"));
-  // 176 x 88 in the middle: rows 44 to 131.
+  // 176 x 88, centered: rows 44 to 131.
   EXPECT_THAT(record.StoredRow(43).first(3), testing::ElementsAre(0xab, 0xcd, 0xef));
   EXPECT_THAT(record.StoredRow(44).first(3), testing::Not(testing::ElementsAre(0xab, 0xcd, 0xef)));
-  // Screens with more pixels ask for more.
+  // High-resolution screens request larger ones.
   EXPECT_NE(ReadSystemPicture(picture_, 256), nullptr);
   EXPECT_EQ(ReadSystemPicture(picture_, 257), nullptr);
   std::filesystem::copy(folder_.Path("cache/thumbnails/large"),

@@ -22,7 +22,7 @@ using testing::ElementsAre;
 
 constexpr Color kMatte = 0x332211;  // red 0x11, green 0x22, blue 0x33
 
-// A picture of one color.
+// A single-color picture.
 PicturePointer Plain(int32_t width, int32_t height, uint8_t blue, uint8_t green, uint8_t red) {
   PicturePointer picture = MakePicture(width, height, 24);
   for (int32_t y = 0; y < height; ++y) {
@@ -48,7 +48,7 @@ TEST(ThumbnailRecord, IsLaidOutToTheByte) {
   wanted.resize(264);                                                            // reserved
   // blue, green, red of the matte
   for (int i = 0; i < 24; ++i) wanted.insert(wanted.end(), {0x33, 0x22, 0x11});
-  // the picture, 48 x 96, from column 24 on
+  // the picture, 48 x 96, starting at column 24
   wanted.insert(wanted.end(), {1, 2, 3});
   EXPECT_EQ(Head(record, wanted.size()), wanted);
 }
@@ -95,7 +95,7 @@ TEST(ThumbnailRecord, KeepsRowsUpright) {
   EXPECT_TRUE(SamePixels(bitmap, picture->image));
 }
 
-// A reduced decode of 1,601 pixels has 201, of which the last stands for one pixel only.
+// A reduced decode of 1,601 pixels has 201, the last of which stands for a single pixel.
 TEST(ThumbnailRecord, IsTheSameFromAReducedDecode) {
   PicturePointer picture = MakePicture(1601, 1603, 24);
   for (int32_t y = 0; y < 1603; ++y) {
@@ -202,7 +202,7 @@ TEST(ThumbnailFile, IsWrittenInOneStep) {
     EXPECT_THAT(folder.Names(), ElementsAre("a.THN"));
   });
   EXPECT_GT(faults, 2);
-  // A protected file is replaced, a link is too, and what it leads to stays.
+  // A read-only file is replaced, and so is a link, but not its target.
   ASSERT_EQ(chmod(path.c_str(), 0400), 0);
   EXPECT_TRUE(WriteThumbnailFile(record, path, true));
   WriteText(folder.Path("precious"), "precious");

@@ -120,9 +120,9 @@ TEST_F(Convert, ExistingDestinations) {
   const struct {
     const char* name;
     std::vector<std::string> options;
-    const char* input;               // what is typed; null: there is no terminal
+    const char* input;               // typed input; null: no terminal
     std::vector<std::string> names;  // in the folder afterwards
-    bool kept;                       // whether a.pcx still holds the old text
+    bool kept;                       // whether a.pcx still has the old text
   } rows[] = {
       {"default without a terminal", {}, nullptr, {"a [1].pcx", "a.pcx"}, true},
       {"keep both", {"--overwrite", "keep-both"}, nullptr, {"a [1].pcx", "a.pcx"}, true},
@@ -170,11 +170,11 @@ TEST_F(Convert, SourcesOfOneNameNeverReplaceEachOther) {
     EXPECT_EQ(result.status, 0) << result.err;
     EXPECT_THAT(Names("out"), ElementsAre("a [1].pcx", "a.pcx"));
   }
-  // To replace is allowed for the names that were asked for, not for the numbered ones that only
-  // the run came to need.
+  // The permission to replace applies to the requested names, not to numbered ones chosen during
+  // the run.
   Run({In("a.bmp"), In("tree/a.pcx"), "-t", "pcx", "-d", In("out"), "--overwrite", "replace"});
   EXPECT_THAT(Names("out"), ElementsAre("a [1].pcx", "a [2].pcx", "a.pcx"));
-  // A source that is still to be read is not replaced by the output of another.
+  // A source that is still to be read is not replaced by another's output.
   fs::copy_file(In("tree/a.pcx"), In("mono.pcx"));
   const std::vector<uint8_t> old = ReadBytes(In("mono.pcx"));
   EXPECT_EQ(Run({In("mono.bmp"), In("mono.pcx"), "-t", "pcx", "--overwrite", "replace"}).status, 0);

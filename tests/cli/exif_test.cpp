@@ -44,7 +44,7 @@ class ExifCommand : public testing::Test {
  protected:
   ExifCommand() { WriteBytes(picture, LittleEndianBlock()); }
   const TemporaryFolder folder;
-  const ScopedSettings saved;  // a run loads them
+  const ScopedSettings saved;  // commands load them
   const ScopedEnvironment data{"FOTOMILL_DATA", folder.Path("data")};
   const std::string picture = folder.Path("picture.tif");
 };

@@ -18,7 +18,7 @@ using nlohmann::json;
 using testing::ElementsAre;
 using testing::HasSubstr;
 
-// A folder with pictures of every kind of trouble.
+// A folder with all kinds of problematic pictures.
 class FileCommands : public testing::Test {
  protected:
   FileCommands() {
@@ -34,7 +34,7 @@ class FileCommands : public testing::Test {
     fs::create_directories(fs::path(In(name)).parent_path());
     WriteBytes(In(name), bytes);
   }
-  // The `file` fields, with the folder left out.
+  // The `file` fields, without the folder.
   std::vector<std::string> Files(const CommandResult& result) const {
     std::vector<std::string> files;
     for (const json& element : json::parse(result.out)) {
@@ -125,7 +125,7 @@ TEST_F(FileCommands, WhatCannotBeOpenedFailsAloneWithAMessage) {
   EXPECT_EQ(RunCommand({"info", tooLong}).status, 1);
 }
 
-// The superuser may read everything, so the tests' own user steps down meanwhile.
+// Root may read everything, so drops to an ordinary user meanwhile.
 class OrdinaryUser {
  public:
   OrdinaryUser() : stepped_(geteuid() == 0 && seteuid(65534) == 0) {}
@@ -190,7 +190,7 @@ TEST_F(FileCommands, InfoAsJson) {
   EXPECT_TRUE(facts["details"].is_array());
   EXPECT_EQ(array[1].size(), 3u) << array[1];  // file, status, message
   EXPECT_EQ(array[1]["message"], "File open error.");
-  // An element a line, so that readers need no parser to count them.
+  // One element per line, so that readers can count them without a parser.
   EXPECT_EQ(std::count(result.out.begin(), result.out.end(), '\n'), 4);
   EXPECT_EQ(RunCommand({"info", "--json", In("empty")}).out, "[\n]\n");
 }
@@ -204,7 +204,7 @@ TEST_F(FileCommands, HostileNames) {
   EXPECT_THAT(array[1]["file"].get<std::string>(), testing::EndsWith("/\xef\xbf\xbd"
                                                                      "A.bmp"));
   EXPECT_TRUE(array[1].contains("fileBytes"));
-  // Pipes get the name as it is, terminals never a control character.
+  // Pipes receive raw names, terminals never a control character.
   EXPECT_THAT(RunCommand({"verify", escape}).out, HasSubstr("e\x1b[31m\n.bmp: Ok"));
   EXPECT_THAT(RunCommand({"verify", escape}, {.output = true}).out, HasSubstr("e\\x1B[31m\\n.bmp: Ok"));
   const CommandResult failing =
@@ -222,7 +222,7 @@ TEST_F(FileCommands, VerifyDecodesWhatInfoOnlyLooksAt) {
   EXPECT_TRUE(result.Says(In("cut.bmp") + ": File read error.")) << result.err;
 }
 
-// Every command opens a picture whose name lies, and tells what it is.
+// Every command opens a picture with the wrong extension, and reports its format.
 TEST_F(FileCommands, OpensFilesWhoseNamesLie) {
   ASSERT_EQ(RunCommand({"convert", In("a.bmp"), "--to", "jpg", "--out", In("made.jpg")}).status, 0);
   fs::rename(In("made.jpg"), In("photo.png"));

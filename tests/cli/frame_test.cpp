@@ -20,7 +20,7 @@ TEST(Frame, ExitStatusesAndMessages) {
     const char* name;
     std::vector<std::string> arguments;
     int status;
-    const char* out;  // a part of it
+    const char* out;  // must be contained
     const char* err;
   } rows[] = {
       {"no command", {}, 2, "", "Usage: fotomill"},
@@ -87,7 +87,7 @@ TEST(Frame, ExitStatusesAndMessages) {
   }
 }
 
-// Whatever a name looks like, it comes through byte for byte.
+// Names are passed through byte for byte, whatever they look like.
 TEST(Frame, NamesComeThroughUnchanged) {
   for (const std::string name :
        {"[a,b].bmp", "[x]", "{}", "%%", "", " ", "a\nb.bmp", "\xff\xfe.bmp", "--", "-x.bmp",
@@ -158,9 +158,9 @@ TEST(ShownText, ControlsAndBrokenUtf8AreEscaped) {
       {"gr\xc3\xbc\xc3\x9f \xe2\x82\xac \xf0\x9f\x98\x80", "gr\xc3\xbc\xc3\x9f \xe2\x82\xac \xf0\x9f\x98\x80", true},
       {"\xc2\x9b"
        "31m",
-       "\\xC2\\x9B31m", true},  // a control sequence introducer of eight bits
+       "\\xC2\\x9B31m", true},  // 8-bit control sequence introducer
       {"\x9b", "\\x9B", false},
-      {"\xc0\xaf", "\\xC0\\xAF", false},           // too long a form
+      {"\xc0\xaf", "\\xC0\\xAF", false},           // overlong form
       {"\xed\xa0\x80", "\\xED\\xA0\\x80", false},  // a surrogate
       {"\xf4\x90\x80\x80", "\\xF4\\x90\\x80\\x80", false},
       {"cut \xe2\x82", "cut \\xE2\\x82", false},

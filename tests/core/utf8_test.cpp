@@ -19,8 +19,8 @@ TEST(Utf8, CharactersAreReadOneByOne) {
       {"\xF0\x9F\x98\x80\xF4\x8F\xBF\xBF", U"\U0001F600\U0010FFFF"},
       {"\xC0\x80", U"\uFFFD\uFFFD"},                        // overlong
       {"\xED\xA0\x80", U"\uFFFD\uFFFD\uFFFD"},              // a surrogate
-      {"\xF4\x90\x80\x80", U"\uFFFD\uFFFD\uFFFD\uFFFD"},    // beyond the last
-      {"\xE2\x82", U"\uFFFD\uFFFD"},                        // cut
+      {"\xF4\x90\x80\x80", U"\uFFFD\uFFFD\uFFFD\uFFFD"},    // out of range
+      {"\xE2\x82", U"\uFFFD\uFFFD"},                        // truncated
       {"\x80z\xFFz", U"\uFFFDz\uFFFDz"},
   };
   for (const Row& row : rows) {
@@ -41,7 +41,7 @@ TEST(Utf8, TextsAreCutBetweenCharacters) {
   const size_t lengths[] = {0, 1, 1, 3, 3, 3, 6, 6, 6, 6, 10, 11, 11};
   for (size_t limit = 0; limit < std::size(lengths); ++limit)
     EXPECT_EQ(CutText(kText, limit).size(), lengths[limit]) << limit;
-  EXPECT_EQ(CutText("\x80\x80\x80\x80\x80", 4).size(), 4u);  // no character is cut
+  EXPECT_EQ(CutText("\x80\x80\x80\x80\x80", 4).size(), 4u);  // no whole character is cut
 }
 
 }  // namespace

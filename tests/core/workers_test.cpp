@@ -23,7 +23,7 @@ namespace {
 
 using std::chrono::milliseconds;
 
-// A door that tasks wait at, and that counts how many do.
+// A gate that tasks wait at, counting them.
 class Gate {
  public:
   void Pass() {
@@ -38,7 +38,7 @@ class Gate {
     open_ = true;
     changed_.notify_all();
   }
-  // False when fewer than `count` come within some seconds.
+  // False if fewer than `count` arrive within some seconds.
   bool Await(int count) {
     std::unique_lock lock(mutex_);
     return changed_.wait_for(lock, milliseconds(5000), [&] { return waiting_ >= count; });
@@ -79,7 +79,7 @@ TEST(WorkerPool, WhatWaitsKeepsNobodyFromComputing) {
   std::atomic<int> computed{0};
   WorkerPool pool(2);
   for (int i = 0; i < 10; ++i) ASSERT_TRUE(pool.Run(Lane::Blocking, [&] { hanging.Pass(); }));
-  // Two that wait for something slow and have given back their cores.
+  // Two that wait for something slow and have released their cores.
   for (int i = 0; i < 2; ++i) {
     ASSERT_TRUE(pool.Run(Lane::Compute, [&] {
       const CoreRelease release;
@@ -94,7 +94,7 @@ TEST(WorkerPool, WhatWaitsKeepsNobodyFromComputing) {
     }));
   }
   EXPECT_TRUE(computing.Await(2));
-  // What somebody looks at the screen for does not wait for a core.
+  // Urgent tasks do not wait for a core.
   ASSERT_TRUE(pool.Run(Lane::Urgent, [&] { urgent.Pass(); }));
   EXPECT_TRUE(urgent.Await(1));
   EXPECT_EQ(computing.Waiting(), 2);
@@ -118,7 +118,7 @@ TEST(WorkerPool, AnExceptionEndsOneTaskOnly) {
 }
 
 TEST(ShareOut, UsesCoresThatAreFreeAndOnlyThose) {
-  // Alone, the work is on every core; while other tasks have the rest, it is on the calling thread.
+  // Alone, the work runs on all cores; while other tasks occupy the rest, on the calling thread.
   for (const bool busy : {false, true}) {
     SCOPED_TRACE(busy);
     Gate others;
@@ -204,7 +204,7 @@ TEST(OrderedRun, TellsWhatRanOutOfMemoryAndGoesOn) {
 }
 
 TEST(OrderedRun, AQuestionHoldsNoCore) {
-  // The first item asks; those behind it wait for their turn. Work of others goes on meanwhile.
+  // The first item asks; the next ones wait for their turn. Other work continues meanwhile.
   WorkerPool pool(2);
   std::atomic<bool> othersDone = false;
   std::vector<size_t> turns;
@@ -294,7 +294,7 @@ TEST(BackgroundTask, GoesWithItsOwnerAndSaysHowItEnded) {
   EXPECT_TRUE(saw);
 }
 
-// Every folder but "/near" is on the network; asking about one is told.
+// Every folder but "/near" is on the network; queries are counted.
 std::atomic<int> asked{0};
 platform::Volume FarVolume(const std::string& path) {
   ++asked;

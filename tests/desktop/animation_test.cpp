@@ -13,8 +13,8 @@
 namespace fotomill::desktop {
 namespace {
 
-// A GIF of 1 by 1 whose frames have these delays in hundredths of a second, black and white in
-// turn. `repeats` below 0: it does not loop.
+// A 1 x 1 GIF whose frames have these delays in hundredths of a second, alternating black and
+// white. `repeats` below 0: it does not loop.
 std::vector<uint8_t> Gif(const std::vector<int>& delays, int repeats) {
   std::string text = "474946383961 0100 0100 80 00 00 000000 FFFFFF ";
   const auto word = [](int value) {
@@ -40,7 +40,7 @@ class Player {
   }
   AnimationPlayer* operator->() { return player_.get(); }
 
-  // Lets the decoder do all it can do, then asks for the frame: its number and the blue of its
+  // Lets the decoder finish, then requests the frame: its number and the blue of its
   // pixel, as "2:FF".
   std::string At(double now) {
     ViewPicturePointer picture;
@@ -98,7 +98,7 @@ TEST(AnimationPlayer, ShowsEachFrameForItsTime) {
        true},
       {"one frame", Gif({10}, 0), {{0, "0:black"}, {0.2, "0:black"}}, false},
   };
-  // all frames in memory, or two of them
+  // all frames cached, or two of them
   for (const uint64_t capacity : {uint64_t{1} << 28, uint64_t{0}}) {
     for (const Row& row : rows) {
       SCOPED_TRACE(row.name);
@@ -116,7 +116,7 @@ TEST(AnimationPlayer, ShowsEachFrameForItsTime) {
 TEST(AnimationPlayer, PausesStepsAndPlaysOn) {
   for (const uint64_t capacity : {uint64_t{1} << 28, uint64_t{0}}) {
     Player player(Gif({10, 10, 10, 10}, -1), capacity);
-    EXPECT_EQ(player.At(0), "0:black");  // does not play by itself
+    EXPECT_EQ(player.At(0), "0:black");  // does not start by itself
     EXPECT_EQ(player.At(9), "0:black");
     player->Step(1);
     EXPECT_EQ(player.At(9), "1:white");
@@ -131,7 +131,7 @@ TEST(AnimationPlayer, PausesStepsAndPlaysOn) {
     EXPECT_EQ(player.At(20), "3:white");
     player->Play();
     EXPECT_EQ(player.At(20), "3:white");
-    EXPECT_EQ(player.At(20.1), "3:white");  // the end of the only round
+    EXPECT_EQ(player.At(20.1), "3:white");  // the end of the only loop
     EXPECT_FALSE(player->Playing());
     player->Play();
     EXPECT_EQ(player.At(21), "0:black");
@@ -189,7 +189,7 @@ TEST(Slideshow, GoesThroughTheList) {
   EXPECT_EQ(Order({.repeat = true}, 3, 1, 4), (Places{1, 2, 0, 1, 2}));
   EXPECT_EQ(Order({.repeat = false}, 3, 1, 4), (Places{1, 2}));
   EXPECT_EQ(Order({.random = true, .repeat = true}, 1, 0, 2), (Places{0, 0, 0}));
-  // Random: each place once in every round, none twice in a row.
+  // Random: each index once in every round, never twice in a row.
   Places once = Order({.random = true, .repeat = false}, 20, 7, 100);
   EXPECT_FALSE(std::ranges::is_sorted(once));
   EXPECT_EQ(once.front(), 7u);

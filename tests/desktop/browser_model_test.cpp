@@ -22,8 +22,8 @@ TEST(NaturalOrder, NumbersCountAsNumbers) {
     EXPECT_LT(CompareNatural(inOrder[i], inOrder[i + 1]), 0);
     EXPECT_GT(CompareNatural(inOrder[i + 1], inOrder[i]), 0);
   }
-  // Numbers longer than any integer, and names that differ in case or zeros only, still have one
-  // order.
+  // Numbers beyond any integer type, and names that differ only in case or zeros,
+  // are still ordered.
   EXPECT_LT(CompareNatural("99999999999999999999999", "100000000000000000000000"), 0);
   EXPECT_NE(CompareNatural("A", "a"), 0);
   EXPECT_NE(CompareNatural("a01", "a1"), 0);
@@ -152,7 +152,7 @@ TEST(DetailColumns, AreArrangedByAText) {
       ParseDetailColumns("Size:99,-Name:300,nonsense,-Type:9999999,Size:1,Depth:x,Gone:3");
   ASSERT_EQ(arranged.size(), all.size());
   EXPECT_EQ(arranged[0], (DetailColumn{2, 99, true}));
-  EXPECT_EQ(arranged[1], (DetailColumn{0, 300, true}));  // the names cannot be hidden
+  EXPECT_EQ(arranged[1], (DetailColumn{0, 300, true}));  // the name column cannot be hidden
   EXPECT_EQ(arranged[2], (DetailColumn{1, 4000, false}));
   EXPECT_EQ(arranged[3], all[3]);
   EXPECT_EQ(ParseDetailColumns(DetailColumnsText(arranged)), arranged);
@@ -190,7 +190,7 @@ TEST(Palette, EveryTextIsReadable) {
   const Shade systems[][4] = {
       {{255, 255, 255}, {0, 0, 0}, {0x35, 0x84, 0xe4}, {255, 255, 255}},           // light
       {{0x2d, 0x2d, 0x2d}, {255, 255, 255}, {0x15, 0x53, 0x9e}, {255, 255, 255}},  // dark
-      {{0, 0, 0}, {255, 255, 255}, {255, 255, 255}, {0, 0, 0}},                    // much contrast
+      {{0, 0, 0}, {255, 255, 255}, {255, 255, 255}, {0, 0, 0}},                    // high contrast
       {{0x80, 0x80, 0x80}, {0x90, 0x90, 0x90}, {0x70, 0x70, 0x70}, {0x88, 0x88, 0x88}},
       {{0xfd, 0xf6, 0xe3}, {0x65, 0x7b, 0x83}, {0xee, 0xe8, 0xd5}, {0x58, 0x6e, 0x75}},
   };
@@ -208,7 +208,7 @@ TEST(Palette, EveryTextIsReadable) {
     }
   }
   EXPECT_EQ(PaletteOf(systems[1][0], systems[1][1], systems[1][2], systems[1][3]).selected,
-            systems[1][2]);  // kept where it can be
+            systems[1][2]);  // kept if possible
 }
 
 TEST(Selection, MouseAndKeyboard) {
@@ -226,7 +226,7 @@ TEST(Selection, MouseAndKeyboard) {
   EXPECT_EQ(lines(), (Lines{1, 2, 6, 7}));
   selection.Click(6, false, true);
   EXPECT_EQ(lines(), (Lines{1, 2, 7}));
-  selection.MoveFocus(3, false, true);  // the focus alone
+  selection.MoveFocus(3, false, true);  // only the focus
   EXPECT_EQ(lines(), (Lines{1, 2, 7}));
   selection.ToggleFocus();
   selection.MoveFocus(4, true, false);
@@ -248,7 +248,7 @@ TEST(CellLayout, HundredThousandCells) {
   CellLayout layout;
   layout.SetCells(100, 120, 4);
   layout.SetCount(100'001);
-  layout.SetWindow(550, 400);  // 5 columns, 26 pixels to spare
+  layout.SetWindow(550, 400);  // 5 columns, 26 pixels left over
   EXPECT_EQ(layout.Columns(), 5);
   EXPECT_EQ(layout.Rows(), 20'001);
   const Rect last = layout.Cell(100'000);

@@ -68,8 +68,7 @@ TEST_F(DesktopFilesTest, TurnsGiveTheFileBackAndTheirThumbnailsGo) {
   test::WriteBytes(path, test::BitmapFile(9, 5, 24));
   EXPECT_EQ(TurnOneFile(From("link.bmp"), Orientation::HalfTurn).failures.size(), 1u);
   EXPECT_TRUE(std::filesystem::is_symlink(From("link.bmp")));
-  // What comes after a batch has replaced a file, and before it ends, is somebody else's work as
-  // well.
+  // Files that replace outputs of a batch before it ends are someone else's work, too.
   PreviousFiles batch;
   ASSERT_TRUE(batch.Keep(path) && batch.Keep(From("b.png")));
   WriteText(path, "turned");
@@ -103,7 +102,7 @@ TEST(Favourites, AreKeptInOrderAndFollowRenames) {
   Favourites favourites;
   for (const char* added : {"/b", "/a/c", "/b", "/a b"}) EXPECT_TRUE(favourites.Add(added));
   EXPECT_FALSE(favourites.Add("/new\nline"));
-  Favourites other;  // of another process
+  Favourites other;  // in another process
   EXPECT_TRUE(other.Remove("/b"));
   EXPECT_TRUE(favourites.FollowRename("/a", "/z"));
   EXPECT_FALSE(favourites.FollowRename("/q", "/z"));

@@ -23,7 +23,7 @@ TEST(Destination, OutlookIsOfTheFolderThatIsWrittenTo) {
                                        folder.Path("in/c.bmp")};
   for (const char* taken : {"in/a.png", "out/b.png", "out/c.png"})
     test::WriteText(folder.Path(taken), "old");
-  // the setting is where the step begins, not what it does
+  // the setting determines the initial choice, not the operation
   for (const int32_t beside : {0, 1}) {
     settings.DestForceSourceDir = beside;
     const DestinationChoice into{.extension = "png", .folder = folder.Path("out")}, own{.extension = "png", .folder = {}};

@@ -52,7 +52,7 @@ TEST(FileTip, TellsFactsOrWhatIsWrong) {
   EXPECT_EQ(last("b.gif", Status::Ok).size(), 1u);
 }
 
-// A data folder and settings of its own.
+// A fresh data folder and fresh settings.
 class Reports : public testing::Test {
  protected:
   Reports() {

@@ -16,7 +16,7 @@
 namespace fotomill::desktop {
 namespace {
 
-// Keys that the sources use, apart from those that only list keys.
+// Keys used by the sources, except those that only list keys.
 std::set<std::string> UsedKeys() {
   std::set<std::string> used;
   for (const auto& entry : std::filesystem::recursive_directory_iterator(test::SourcePath("src"))) {
@@ -48,8 +48,8 @@ TEST(SetupPages, ShowSettingsThatDoSomethingAndExplainThem) {
   }
 }
 
-// The page of format options has each format in one group, and all of its settings but those that
-// belong to other pages.
+// The page of format options has each format in one group, with all of its settings except those on
+// other pages.
 TEST(SetupPages, FormatsHaveAGroupEach) {
   std::set<std::string_view> groups;
   for (const FormatSettings* const codec : SettingsOfFormats()) {
@@ -68,7 +68,7 @@ TEST(SetupPages, SearchFindsEveryWord) {
   struct Row {
     const char* words;
     KeyNumber found;
-    size_t most;  // how many others may be found with it
+    size_t most;  // maximum number of other matches
   };
   const Row rows[] = {
       {"jpegcompression", KeyNumber::JpegCompression, 2},

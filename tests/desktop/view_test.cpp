@@ -31,7 +31,7 @@ TEST(ViewTransform, FitsAndZoomsAtThePointer) {
   view.SetMode(ZoomMode::Fill);
   EXPECT_EQ(view.ShownHeight(), 200);
   EXPECT_EQ(view.X(), -100);
-  // The picture's point under the pointer stays there.
+  // The point of the picture under the pointer stays there.
   view.ZoomTo(4, 50, 150);
   EXPECT_EQ(view.X(), 50 - 4 * 150);
   EXPECT_EQ(view.Y(), 150 - 4 * 150);
@@ -40,7 +40,7 @@ TEST(ViewTransform, FitsAndZoomsAtThePointer) {
   EXPECT_EQ(view.Y(), 200 - 800);
   view.ZoomTo(0.00001, 0, 0);
   EXPECT_EQ(view.ShownWidth(), 4);
-  // The same part of another picture, in parts of it; in another window at as many times its fit.
+  // The same relative part of another picture; in another window at the same multiple of its fit.
   view.SetPicture(800, 400);
   view.ZoomTo(1, 100, 100);
   view.Pan(-100, -30);
@@ -57,7 +57,7 @@ TEST(ViewTransform, FitsAndZoomsAtThePointer) {
   other.StartAfresh(choice::kZoomFill);
   EXPECT_EQ(other.Scale(), 0.5);
   EXPECT_EQ(other.X(), -200);
-  // A small picture is not enlarged to fit, unless that is asked for.
+  // Small pictures are not enlarged to fit unless requested.
   view.SetPicture(10, 10);
   view.SetMode(ZoomMode::Fit);
   EXPECT_EQ(view.Scale(), 1);
@@ -73,7 +73,7 @@ PackedImage Ramp(int32_t width, int32_t height) {
   return image;
 }
 
-// Green of the pixels of a row of the canvas, the blue ones of the background as 255.
+// Green of the pixels in a row of the canvas, 255 for the blue background.
 std::vector<int> Greens(const RgbImage& canvas, int32_t y) {
   std::vector<int> values;
   for (int32_t x = 0; x < canvas.width; ++x) values.push_back(canvas.Row(y)[3 * x + 1]);
@@ -92,14 +92,14 @@ TEST(DrawView, PlacesCopiesAndSamples) {
   DrawView(source, view, plain, true, canvas);
   EXPECT_EQ(Greens(canvas, 0), (std::vector<int>{255, 255, 255, 255, 255, 255}));
   EXPECT_EQ(Greens(canvas, 1), (std::vector<int>{255, 255, 1, 4, 255, 255}));
-  EXPECT_EQ(canvas.Row(1)[6], 2);  // red comes first
+  EXPECT_EQ(canvas.Row(1)[6], 2);  // red first
   view.ZoomToMiddle(2);
   DrawView(source, view, plain, false, canvas);
   EXPECT_EQ(Greens(canvas, 0), (std::vector<int>{255, 1, 1, 4, 4, 255}));
   EXPECT_EQ(Greens(canvas, 2), (std::vector<int>{255, 41, 41, 44, 44, 255}));
   DrawView(source, view, plain, true, canvas);
   EXPECT_EQ(Greens(canvas, 0), (std::vector<int>{255, 1, 2, 3, 4, 255}));
-  // Far zoomed in and panned to the end, nothing is read beyond the picture.
+  // At maximum zoom, panned to the end, nothing is read beyond the picture.
   view.ZoomTo(64, 0, 0);
   view.Pan(-1000, -1000);
   DrawView(source, view, plain, true, canvas);
@@ -126,8 +126,8 @@ TEST(DrawView, SquaresShowThroughAndStayInPlace) {
   view.Pan(-1, 0);
   DrawView(source, view, squares, false, canvas);
   EXPECT_EQ(Greens(canvas, 0), (std::vector<int>{100, 100, 200, 200, 10, 10}));
-  // Between pixels, what is transparent gives no color away: from 10 to the square behind without a
-  // shade of 7.
+  // Interpolation ignores the colors of transparent pixels: from 10 to the background square
+  // without a shade of 7.
   view.ZoomTo(4, 0, 0);
   view.Pan(-100, 0);
   DrawView(source, view, {.around = 0x000a00}, true, canvas);
@@ -159,12 +159,12 @@ TEST(ViewPicture, FollowsItsProfileAndKeepsItsAlpha) {
   ViewRequest request{path, 0, 4, 4, {.profiles = true, .keepAlpha = true}};
   const ViewPicturePointer managed = LoadViewPicture(request);
   ASSERT_EQ(managed->status, Status::Ok);
-  EXPECT_EQ(managed->picture->image.Row(1)[0], 110);  // 40 of light, as sRGB writes it
+  EXPECT_EQ(managed->picture->image.Row(1)[0], 110);  // linear light 40, in sRGB
   EXPECT_EQ(managed->picture->alpha.Width(), 8);
   EXPECT_EQ(managed->fitted.alpha.Width(), 4);
   request.look = {};
   const ViewPicturePointer plain = LoadViewPicture(request);
-  EXPECT_EQ(plain->picture->image.Row(1)[0], 0xc0);  // the background, since all is transparent
+  EXPECT_EQ(plain->picture->image.Row(1)[0], 0xc0);  // the background: all is transparent
   EXPECT_TRUE(plain->picture->alpha.Empty());
   EXPECT_GT(managed->Bytes(), plain->Bytes());
 }
@@ -181,7 +181,7 @@ TEST(PhotoFacts, TellWhatPhotographersAsk) {
                  date = text("2001:05:19 18:36:41");
   const uint32_t exposure = builder.Bytes({5, 0, 0, 0, 2, 0, 0, 0}),
                  aperture = builder.Bytes({28, 0, 0, 0, 10, 0, 0, 0}),
-                 length = builder.Bytes({50, 0, 0, 0, 0, 0, 0, 0});  // by nothing
+                 length = builder.Bytes({50, 0, 0, 0, 0, 0, 0, 0});  // divided by zero
   builder.Patch32(4, builder.Directory({{0x010f, 2, 17, make},
                                         {0x0110, 2, 10, model},
                                         {0x829a, 5, 1, exposure},
@@ -196,7 +196,7 @@ TEST(PhotoFacts, TellWhatPhotographersAsk) {
 
 TEST(Thumbnail, MatteIsCutOff) {
   RgbImage square = FilledImage(6, 6, 0x112233);
-  // a picture of 4 by 2 whose right side has the matte's color
+  // a picture of 4 x 2 whose right half has the matte's color
   for (int32_t y = 2; y < 4; ++y) square.Row(y)[3] = 9;
   const RgbImage cut = WithoutMatte(square, 0x112233);
   EXPECT_EQ(cut.width, 4);
@@ -210,7 +210,7 @@ TEST(Thumbnail, DatabaseModesKeepWhatTheyMade) {
   const std::string picture = folder.Path("a.bmp");
   std::filesystem::copy_file(test::SourcePath("samples/bmp-true-color.bmp"), picture);
   ThumbnailRequest request{picture, 1, 1, 96, choice::kLocalDatabase};
-  for (int time = 0; time < 2; ++time) {  // the second time it comes from the database
+  for (int time = 0; time < 2; ++time) {  // the second time from the database
     const ThumbnailPointer thumbnail = LoadThumbnail(request);
     ASSERT_EQ(thumbnail->status, Status::Ok);
     EXPECT_EQ(thumbnail->pixels.width, 96);
@@ -230,15 +230,15 @@ TEST(Thumbnail, DatabaseModesKeepWhatTheyMade) {
   EXPECT_EQ(LoadThumbnail(request)->status, Status::FileOpenError);
 }
 
-// A stand-in is the file's own thumbnail, upright as the picture is; if there is none, nothing
-// is decoded.
+// A placeholder is the file's embedded thumbnail, upright like the picture; if there is none,
+// nothing is decoded.
 TEST(Thumbnail, StandInsComeFromTheExif) {
   const test::TemporaryFolder folder;
   const std::string small = folder.Path("small.jpg"), large = folder.Path("large.jpg"),
                     plain = folder.Path("plain.bmp");
   ASSERT_EQ(WritePicture(*test::PatternPicture(16, 12, 24), small, {}), Status::Ok);
   const PicturePointer picture = test::PatternPicture(400, 300, 24);
-  // to be turned right
+  // rotated clockwise
   picture->metadata.exif = test::Hex("49492A00 08000000 0100 1201 0300 01000000 06000000 00000000");
   ASSERT_TRUE(ReplaceExifThumbnail(picture->metadata.exif, test::ReadBytes(small), 65527));
   ASSERT_EQ(WritePicture(*picture, large, {}), Status::Ok);
@@ -254,7 +254,7 @@ TEST(Thumbnail, StandInsComeFromTheExif) {
   EXPECT_EQ(LoadThumbnail(request), nullptr);
   ASSERT_EQ(WriteThumbnail(plain, {}), Status::Ok);
   request.side = 48;
-  const ThumbnailPointer ready = LoadThumbnail(request);  // the proper one, smaller than its record
+  const ThumbnailPointer ready = LoadThumbnail(request);  // the final one, smaller than its record
   ASSERT_NE(ready, nullptr);
   EXPECT_FALSE(ready->standIn);
   EXPECT_EQ(ready->pixels.width, 48);
@@ -281,7 +281,7 @@ TEST(ThumbnailLoader, ForgetsWhatIsNoLongerWanted) {
   const auto request = [](const char* path) { return ThumbnailRequest{path, 1, 2, 96, 0}; };
   loader.Want({request("a"), request("b"), request("c")});
   while (loads == 0) std::this_thread::yield();
-  loader.Want({request("a"), request("d")});  // a is in work
+  loader.Want({request("a"), request("d")});  // a is in progress
   {
     const std::lock_guard lock(gate);
     open = true;

@@ -8,7 +8,7 @@
 #include "drawing/text_block.h"
 #include "processing/geometry/scale.h"
 
-// DejaVu Sans is a package of the project, so its letters can be relied on.
+// DejaVu Sans is in the project's package list, so its glyphs can be relied on.
 namespace fotomill::test {
 namespace {
 
@@ -26,7 +26,7 @@ std::vector<uint32_t> Joined(std::vector<std::vector<uint32_t>> parts) {
   return all;
 }
 
-// The part of a mask that is not empty, and the sum of its coverage in pixels.
+// The nonempty part of a mask, and its total coverage in pixels.
 struct Ink {
   Rectangle bounds;
   double pixels = 0;
@@ -80,7 +80,7 @@ TEST(TextShaping, JoinsStacksAndStandsIn) {
   EXPECT_EQ(Glyphs(font, "\xff"), Glyphs(font, "\uFFFD"));
   EXPECT_EQ(Glyphs(font, "\x01"), Glyphs(font, "\uFFFD"));
   EXPECT_EQ(font.Shape("").width, 0);
-  // A letter of another font keeps its size, and those around it their font.
+  // A fallback glyph keeps the size, and the surrounding letters their font.
   TextFont mono;
   ASSERT_EQ(mono.Open("DejaVu Sans Mono", 40), Status::Ok);
   const TextLine mixed = mono.Shape("aאa");
@@ -171,7 +171,7 @@ TEST(TextBlock, AlignsLines) {
   for (const TextAlign align : {TextAlign::Left, TextAlign::Center, TextAlign::Right}) {
     const TextBlock block = LayOutText(font, "HHHHHHHH\nH", {.align = align});
     PackedImage mask;
-    ASSERT_EQ(NewAlphaPlane(200, 25, mask), Status::Ok);  // the first line's upper half is outside
+    ASSERT_EQ(NewAlphaPlane(200, 25, mask), Status::Ok);  // the first line's upper half is clipped
     ASSERT_EQ(DrawTextBlock(font, block, {100, 0, 0, 0}, mask), Status::Ok);
     const Ink last = InkOf(mask);
     const double left = 100 - block.width / 2, room = block.width - block.lines[1].width / 64.0;

@@ -68,13 +68,13 @@ TEST_F(FileOperationTest, NothingIsEverReplaced) {
     EXPECT_EQ(result.failures.at(0).reason, "A file of that name already exists.");
   }
   EXPECT_EQ(ReadText(To("a.png")) + ReadText(To("a [1].png")) + ReadText(From("a.png")), "therecame meanwhilea.png");
-  // Undoing a move whose old name was given away leaves both files.
+  // Undoing a move whose old name was taken meanwhile keeps both files.
   const FileOperationResult moved =
       CarryOut(PlanFileOperation(FileOperationKind::Move, {From("b.png")}, folder_.Path("to")));
   WriteText(From("b.png"), "new");
   EXPECT_EQ(Revert(moved.done).failures.size(), 1u);
   EXPECT_EQ(ReadText(From("b.png")) + ReadText(To("b.png")), "newb.png");
-  // A copy that was worked on stays as well.
+  // A copy that was modified is kept as well.
   const FileOperationResult copied =
       CarryOut(PlanFileOperation(FileOperationKind::Copy, {From("sub/c.png")}, folder_.Path("to")));
   WriteText(To("c.png"), "was worked on");
@@ -87,7 +87,7 @@ TEST_F(FileOperationTest, AFolderDoesNotGoIntoItself) {
     EXPECT_EQ(CarryOut(PlanFileOperation(kind, {From("sub")}, From("sub"))).failures.size(), 1u);
   }
   EXPECT_THAT(Names("from/sub"), ElementsAre("c.png"));
-  // Links are deleted, never what they lead to.
+  // Links are deleted, never their targets.
   std::filesystem::create_directory_symlink(folder_.Path("to"), From("sub/link"));
   WriteText(To("kept"), "kept");
   EXPECT_THAT(DeleteForGood({From("sub")}).failures, IsEmpty());

@@ -13,11 +13,11 @@ namespace {
 
 using Bytes = std::vector<uint8_t>;
 
-// An array header whose successor is at `next`.
+// An array header with its successor at `next`.
 std::string Array(const char* next = "00000000") {
   return std::string("4241 28000000 ") + next + " 0000 0000  ";
 }
-// A file header, and an information header of 12 bytes.
+// A file header, and a 12-byte information header.
 std::string Header(const char* kind, const char* pixels, const char* sizeAndBits) {
   return std::string(kind) + " 1A000000 0000 0000 " + pixels + "  0C000000 " + sizeAndBits + "  ";
 }
@@ -45,7 +45,7 @@ TEST(Bga, ReadsItsEntries) {
                            kTwoColors + Header("4349", "70000000", "0200 0200 0100 1800") + "" +
                            std::string(48, '0') + "00000000 00000000 00000000 80000000" +
                            "010101 020202 0000  030303 040404 0000";
-  // The same without colors: the lower half has them, the upper one hides the lower right.
+  // As above, without color: the lower half has the colors, the upper one hides the lower right.
   const std::string pointer = Array() +
                               "5054 1A000000 0100 0000 2E000000  0C000000 0200 0400 0100 0100 " +
                               kTwoColors + "80000000 40000000 40000000 00000000";
@@ -118,7 +118,7 @@ TEST(Bga, WritesAnArrayOfOneBitmap) {
   EXPECT_EQ(Bytes(file.end() - 4, file.end()), Hex("030201 4D"));
   const Decoded back = Decode(BgaRead, file);
   EXPECT_EQ(PixelText(back.picture->alpha), "77");
-  color->alpha.Row(0)[0] = 0;  // nothing but zeros is no alpha
+  color->alpha.Row(0)[0] = 0;  // all zeros are not alpha
   EXPECT_TRUE(Decode(BgaRead, Encode(BgaWrite, *color)).picture->alpha.Empty());
   const PicturePointer wide = PatternPicture(65536, 1, 8);
   EXPECT_TRUE(SamePixels(Decode(BgaRead, Encode(BgaWrite, *wide)).picture->image, wide->image));

@@ -23,11 +23,11 @@ struct Header {
   int32_t width = 1, height = 1;
   uint16_t bits = 8;
   uint32_t compression = 0;
-  int32_t offset = -1;  // -1: right behind header and palette
+  int32_t offset = -1;  // -1: right after header and palette
   uint32_t infoSize = 40;
 };
 
-// A file of the Windows dialect: header, then whatever follows the 54 bytes.
+// A file of the Windows dialect: header, then `rest` after the 54 bytes.
 Bytes Windows(const Header& header, std::string_view rest) {
   Bytes bytes = Hex("42 4D  00000000 00000000");
   const uint32_t palette = header.bits > 8 ? 0 : 4u << header.bits;
@@ -44,13 +44,13 @@ Bytes Windows(const Header& header, std::string_view rest) {
   return bytes;
 }
 
-// The same with a palette of zeros before the pixels.
+// As above, with a zeroed palette before the pixels.
 Bytes Indexed(const Header& header, std::string_view pixels) {
   return Windows(header, std::string(size_t{8} << header.bits, '0') + std::string(pixels));
 }
 
 Bytes Os2(uint16_t width, uint16_t height, uint16_t bits, std::string_view rest) {
-  // the pixel offset is nonsense, and not used
+  // an invalid pixel offset, which is ignored
   Bytes bytes = Hex("42 4D  00000000 00000000  FFFFFF7F  0C000000");
   for (const uint16_t value : {width, height, uint16_t{1}, bits}) AppendLittle(bytes, value, 2);
   const Bytes tail = Hex(rest);
@@ -241,7 +241,7 @@ TEST(BmpInfo, MissingFileDoesNotOpen) {
   EXPECT_EQ(BmpDetails(picture), Status::FileOpenError);
 }
 
-// A picture of one row, its alpha values 0x80 from the left on when asked for.
+// A picture of one row; its alpha values, if requested, count up from 0x80.
 PicturePointer OneRow(int32_t bitsPerPixel, std::initializer_list<int32_t> pixels,
                       bool alpha = false) {
   PicturePointer picture = PatternPicture(static_cast<int32_t>(pixels.size()), 1, bitsPerPixel);
@@ -261,7 +261,7 @@ TEST(BmpWrite, HeadersOfBothDialects) {
     PicturePointer picture;
     size_t size;
     Bytes begin;
-    Bytes end;  // the rows
+    Bytes end;  // rows at the end
   };
   const Row rows[] = {
       {"1 bit", 0, OneRow(1, {1, 0, 1}), 66,

@@ -12,7 +12,7 @@ namespace {
 
 using Bytes = std::vector<uint8_t>;
 
-// Bits as digits as entropy-coded bytes, filled up with ones.
+// Entropy-coded bytes from binary digits, padded with ones.
 Bytes Coded(const std::string& digits) {
   Bytes bytes;
   for (size_t i = 0; i < digits.size(); i += 8) {
@@ -26,8 +26,8 @@ Bytes Coded(const std::string& digits) {
   return bytes;
 }
 
-// Blocks of one value: the first differs from 128 by `difference` (of 3 bits) quantizers / 8, the
-// others by the same. Codes are those of T.81, K.3.
+// Flat blocks: the first differs from 128 by `difference` (of 3 bits) quantizers / 8, the others by
+// the same again. Codes are those of T.81, K.3.
 std::string Luma(const char* difference, int blocks) {
   std::string digits = std::string("100") + difference + "1010";
   for (int i = 1; i < blocks; ++i) digits += "001010";
@@ -44,7 +44,7 @@ void Append16(Bytes& bytes, size_t value) {
   bytes.push_back(static_cast<uint8_t>(value));
 }
 
-// Luma quantizers of 16, those of chroma of 24.
+// Luma quantizers of 16, chroma quantizers of 24.
 Bytes Quantizers() {
   Bytes bytes(64, 16);
   bytes.resize(128, 24);
@@ -95,7 +95,7 @@ Bytes File(const std::vector<Area>& areas) {
   return file;
 }
 
-// Y 136, Cb 140, Cr 116: by T.871
+// Y 136, Cb 140, Cr 116, converted as in T.871
 constexpr int32_t kColor = 119 << 16 | 140 << 8 | 157;
 
 TEST(CamRead, Pictures) {

@@ -17,8 +17,8 @@ void Put(Bytes& file, size_t offset, uint32_t value) {
 constexpr size_t Sector(size_t number) { return 512 * (number + 1); }
 constexpr uint32_t kEnd = 0xFFFFFFFE, kFree = 0xFFFFFFFF;
 
-// Sector 0 has the table, 1 the directory, 2 the table of short sectors, 3 the short sectors, and
-// 4, 6, 5, and those from 7 on a stream of 5000 bytes.
+// Sector 0 is the sector table, 1 the directory, 2 the table of short sectors, 3 the short sectors,
+// and 4, 6, 5, and those from 7 on are a stream of 5000 bytes.
 Bytes File() {
   Bytes file(Sector(14));
   const Bytes head =

@@ -13,7 +13,8 @@
 namespace fotomill::test {
 namespace {
 
-// Each part as its name, where its data are and how many; at last the status, where a walk has one.
+// Each part as its name, the offset of its data and their size; finally the status, if a
+// walk has one.
 template <uint64_t mostGarbage>
 std::string JpegPartsOver(WalkedBytes file) {
   std::ostringstream list;

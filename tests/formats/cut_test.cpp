@@ -58,13 +58,13 @@ TEST(Cut, WritesRunsFromThreePixels) {
   Status status = Status::Ok;
   const PicturePointer widest = PatternPicture(65535, 1, 8);
   for (int32_t x = 0; x < 65535; ++x) SetPixel(widest->image, x, 0, x % 2);
-  EXPECT_TRUE(Encode(CutWrite, *widest, &status).empty());  // its code needs more than 65535 bytes
+  EXPECT_TRUE(Encode(CutWrite, *widest, &status).empty());  // its packed row exceeds 65535 bytes
   EXPECT_EQ(status, Status::UnsuitableImage);
   EXPECT_TRUE(Encode(CutWrite, *PatternPicture(3, 1, 24), &status).empty());
   EXPECT_EQ(status, Status::TooManyColors);
 }
 
-// A palette of two colors, whose highest values are given.
+// A palette of two colors with given maximum values.
 Bytes SmallPalette(const std::string& index, const std::string& highest) {
   return Hex("4148 E300 0C00 0A00 0000 0000 " + index + highest +
              "44722E2048616C6F 00000000 00000000 00000000  0100 0200 0300  3F00 1F00 FF00");
@@ -104,7 +104,7 @@ TEST(Cut, ColorsComeFromThePaletteBeside) {
   }
 }
 
-// 78 colors fill the first block but for 4 bytes, 85 each of the others but for 2.
+// 78 colors fill the first block except for 4 bytes, 85 each of the others except for 2.
 TEST(Cut, ColorsDoNotCrossBlocks) {
   const TemporaryFolder folder;
   const PicturePointer picture = PatternPicture(4, 4, 8);
@@ -136,7 +136,7 @@ TEST(Cut, BothFilesAppearOrNeither) {
     return CutWrite(*picture, {.existing = existing});
   };
 
-  WriteText(folder.Path("a.pal"), "somebody's own");  // a palette of another program
+  WriteText(folder.Path("a.pal"), "somebody's own");  // another program's palette
   EXPECT_EQ(write(platform::Existing::Replace), Status::ErrorCreatingFile);
   EXPECT_EQ(ReadText(folder.Path("a.pal")), "somebody's own");
   EXPECT_EQ(folder.Names(), Names{"a.pal"});

@@ -16,7 +16,7 @@ void Put(Bytes& bytes, size_t at, uint32_t value) {
   for (size_t i = 0; i < 4; ++i) bytes[at + i] = static_cast<uint8_t>(value >> (8 * i));
 }
 
-// A collection of two pages of 5 x 3 and 9 x 2 pixels; the first page comes last in the file.
+// A collection of two pages of 5 x 3 and 9 x 2 pixels; the first page is last in the file.
 Bytes Collection() {
   const Bytes first = Encode(PcxWrite, *PatternPicture(5, 3, 8)),
               second = Encode(PcxWrite, *PatternPicture(9, 2, 8));

@@ -1,10 +1,10 @@
-// Holds for every codec of the registry, and for each new one without a line here: what it writes
-// it reads back, broken files and a failing system leave nothing half done, and progress is told.
+// Checks every codec of the registry, including new ones automatically: it reads back what it
+// writes, damaged files and system errors leave nothing half done, and progress is reported.
 //
-// Pictures in tests/formats/FORMAT/good are read, described and cut short; a picture
-// REFERENCE/NAME.bmp beside them, in the folder tests/formats/FORMAT/reference, says what they
-// show. Pictures in tests/formats/FORMAT/bad have the status that reading them gives before their
-// extension: "huge-width.3.bmp".
+// Pictures in tests/formats/FORMAT/good are read, described and truncated; the expected
+// picture is REFERENCE/NAME.bmp in the folder tests/formats/FORMAT/reference. Pictures in
+// tests/formats/FORMAT/bad have the expected status of reading them before the extension:
+// "huge-width.3.bmp".
 
 #include <gtest/gtest.h>
 
@@ -23,7 +23,7 @@ namespace {
 
 namespace fs = std::filesystem;
 
-// What comes back of a written picture, for the rows that cannot keep all of it.
+// What a written picture keeps, for rows that cannot keep all of it.
 enum class Keeps { All, Size, Nothing };
 struct Keeping {
   std::string_view extension;
@@ -32,15 +32,15 @@ struct Keeping {
 // clang-format off
 constexpr Keeping kKeepings[] = {
     {"MAC", Keeps::Nothing},                        // one size for all pictures
-    {"TXT", Keeps::Nothing},                        // characters, which are drawn larger
-    {"UUE", Keeps::Size},                           // a JPEG inside
-    {"FIT", Keeps::Size}, {"FTS", Keeps::Size},     // gray only
+    {"TXT", Keeps::Nothing},                        // characters, drawn larger
+    {"UUE", Keeps::Size},                           // embedded JPEG
+    {"FIT", Keeps::Size}, {"FTS", Keeps::Size},     // grayscale only
     {"JPG", Keeps::Size}, {"JPEG", Keeps::Size},    // lossy
     {"JPE", Keeps::Size}, {"JFI", Keeps::Size},
     {"JFIF", Keeps::Size},  {"WEBP", Keeps::Size},
     {"HDP", Keeps::Size},   {"WDP", Keeps::Size},
     {"HAM", Keeps::Size},                           // hold and modify
-    {"PIC", Keeps::Size},                           // colors of 6 bits
+    {"PIC", Keeps::Size},                           // 6-bit colors
 };
 // clang-format on
 
@@ -51,7 +51,7 @@ Keeps KeepsOf(const FormatEntry& row) {
   return Keeps::All;
 }
 
-// The deepest picture that a row really writes. PIC names two formats, one of which is deeper.
+// The actual maximum depth of a row's writer. PIC has two formats, one of which is deeper.
 int32_t DeepestOf(const FormatEntry& row) {
   return row.extension.view() == "PIC" ? 8 : static_cast<int32_t>(row.maxBits);
 }
@@ -66,7 +66,7 @@ void ForEachRow(bool writable, Action action) {
   }
 }
 
-// The color at a place, 0x00RRGGBB, whatever the depth.
+// The color at a position, 0x00RRGGBB, at any depth.
 int32_t ColorAt(const PackedImage& image, int32_t x, int32_t y) {
   const int32_t value = image.PixelAt(x, y);
   if (image.Bits() == 24) return value;
@@ -74,7 +74,7 @@ int32_t ColorAt(const PackedImage& image, int32_t x, int32_t y) {
   return entry[2] << 16 | entry[1] << 8 | entry[0];
 }
 
-// Empty when both show the same, else where they differ first.
+// Empty if both show the same, else the first difference.
 std::string Difference(const PackedImage& a, const PackedImage& b) {
   if (a.Width() != b.Width() || a.Height() != b.Height()) return "size";
   for (int32_t y = 0; y < a.Height(); ++y) {
@@ -105,7 +105,7 @@ std::vector<std::string> Fixtures(std::string_view kind) {
   return files;
 }
 
-// Whole pictures of formats that can be read: the fixtures and the project's samples.
+// Valid pictures of readable formats: the fixtures and the project's samples.
 std::vector<std::string> GoodPictures() {
   std::vector<std::string> files = Fixtures("good");
   for (std::string& file : FilesIn(SourcePath("samples"))) {
@@ -118,7 +118,7 @@ std::vector<std::string> GoodPictures() {
   return files;
 }
 
-// Counts what a codec tells.
+// Counts a codec's progress reports.
 class CountingSink : public ProgressSink {
  public:
   void Begin() override { ++begun; }
@@ -200,7 +200,7 @@ TEST(EveryCodec, WritesUpToTheLimitsOfItsRow) {
       const TemporaryFolder folder;
       const std::string path = folder.Path("picture." + LowerCase(row.extension.view()));
       const PicturePointer picture = PatternPicture(size.width, size.height, 1);
-      // of one color, so that no code of a row is too long
+      // single-color, so that no packed row is too long
       for (int32_t y = 0; y < size.height; ++y) std::ranges::fill(picture->image.Row(y), 0);
       ASSERT_EQ(WritePicture(*picture, path, {}), size.status);
       ASSERT_EQ(fs::exists(path), size.status == Status::Ok);
@@ -274,8 +274,7 @@ TEST(EveryCodec, RefusesBadPictures) {
   }
 }
 
-// Info, details and reading of a file that may be anything: never a picture together with a
-// failure.
+// Info, details and reading of an arbitrary file: never both a picture and a failure.
 void ExpectClean(const FormatEntry& row, const std::string& path) {
   const PicturePointer picture = NewPictureRecord();
   picture->fileName.AssignCut(path);
@@ -338,7 +337,7 @@ TEST(EveryCodec, FailedWriteLeavesTheDestinationAlone) {
       ExpectWellBehaved(sink);
       EXPECT_EQ(ReadText(folder.Path(name)) == "old", status != Status::Ok);
       std::vector<std::string> names = folder.Names();
-      if (status == Status::Ok) std::erase(names, "picture.pal");  // of CUT, the second file
+      if (status == Status::Ok) std::erase(names, "picture.pal");  // second file of CUT
       EXPECT_EQ(names, std::vector<std::string>{name});
     });
     EXPECT_GT(faults, 2);

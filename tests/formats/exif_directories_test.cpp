@@ -16,13 +16,13 @@ namespace {
 std::vector<std::string> LinesOf(const std::vector<uint8_t>& block) {
   CollectedLines sink;
   WalkExif(block, &sink);
-  // Where directories lie, and how, differs.
+  // Offsets and layouts of directories may differ.
   std::erase_if(sink.lines,
                 [](const std::string& line) { return line.find(" tag=") != std::string::npos; });
   return sink.lines;
 }
 
-// What is told of the picture: without the layout of a first directory and without the thumbnail.
+// Lines about the picture: without IFD0's layout tags and without the thumbnail.
 std::vector<std::string> PictureLines(const std::vector<uint8_t>& block) {
   return LinesOf(MakeExifBlock(ParseExifBlock(block)));
 }
@@ -43,7 +43,7 @@ TEST(ExifDirectories, TravelThroughFilesOfDirectories) {
       ASSERT_EQ(back.status, Status::Ok);
       EXPECT_EQ(picture->lostMetadata, 0);
       EXPECT_EQ(PictureLines(back.picture->metadata.exif), PictureLines(block));
-      const TemporaryFolder folder;  // the same without decoding
+      const TemporaryFolder folder;  // without decoding
       WriteBytes(folder.Path("picture"), Encode(row.write, *picture));
       ExifSource source;
       ASSERT_EQ(source.Open(folder.Path("picture").c_str()), Status::Ok);
@@ -65,8 +65,7 @@ TEST(ExifDirectories, DamagedBlocksAreTakenAsFarAsTheyGo) {
     const std::vector<uint8_t> made = MakeExifBlock(directories);
     EXPECT_EQ(MakeExifBlock(ParseExifBlock(made)), made) << length;
   }
-  // A value that would begin in front of its own end, a directory that leads to itself, a count
-  // that no file holds.
+  // A value that overlaps its entry, a directory that links to itself, a count beyond any file.
   EXPECT_TRUE(ParseExifBlock(Hex("4949 2A00 08000000 0100 0F01 0200 FFFFFFFF FFFFFFFF")).first.empty());
   EXPECT_EQ(ParseExifBlock(Hex("4949 2A00 08000000 0100 6987 0400 01000000 08000000 00000000")).exif.size(), 0u);
 }

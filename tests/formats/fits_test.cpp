@@ -13,7 +13,7 @@ namespace {
 using namespace test;
 using Bytes = std::vector<uint8_t>;
 
-// Cards of 80 characters from texts that "|" separates.
+// 80-character cards from texts separated by "|".
 std::string Cards(std::string_view texts) {
   std::string cards;
   while (!texts.empty()) {
@@ -24,14 +24,14 @@ std::string Cards(std::string_view texts) {
   return cards;
 }
 
-// A header of those cards between SIMPLE and END, with blanks up to the data.
+// A header with those cards between SIMPLE and END, blank-padded to the data.
 std::string Header(const std::string& texts) {
   std::string header =
       Cards(std::string("SIMPLE  =                    T|").append(texts).append("|END"));
   return header.append((2880 - header.size() % 2880) % 2880, ' ');
 }
 
-// What FitsWrite makes of a picture, and the data without header and padding.
+// The file FitsWrite creates, and its data without header and padding.
 std::string Written(PictureRecord& picture) {
   const TemporaryFolder folder;
   picture.fileName.AssignCut(folder.Path("a.fits"));
@@ -88,7 +88,7 @@ TEST(Fits, WritesGrayOfEveryDepth) {
   }
 }
 
-// Rows long enough for every way of computing them, with an odd end.
+// Rows long enough for all code paths, of odd length.
 TEST(Fits, GrayOfEveryLevelFollowsTheFormula) {
   Bytes row, expected;
   for (unsigned i = 0; i < 3 * 1024 + 13; ++i) {
@@ -161,10 +161,10 @@ TEST(Fits, ReadsHeaders) {
   }
 }
 
-// The data begin where the next block does, and a header of more than 65536 cards has no end.
+// The data start at the next block, and a header of more than 65536 cards has no end.
 TEST(Fits, FindsTheEndOfTheHeader) {
   const struct {
-    size_t cards;  // before END; 35 of them let it end the first block
+    size_t cards;  // before END; with 35 of them it ends the first block
     Status read;
   } rows[] = {
       {35, Status::Ok}, {36, Status::Ok}, {65535, Status::Ok}, {65536, Status::FileReadError}, {131072, Status::FileReadError}};
@@ -188,7 +188,7 @@ TEST(Fits, ShowsTheBytesOfEachRowAsTheyAre) {
     const char* name;
     const char* cards;
     const char* data;
-    Bytes top, bottom;  // with their padding
+    Bytes top, bottom;  // including padding
   } rows[] = {
       {"8 bits, padding is zero", "BITPIX=8|NAXIS1=3", "abcdef", Hex("61 62 63 00"), Hex("64 65 66 00")},
       {"16 bits: the left half, high and low bytes", "BITPIX=16|NAXIS1=5", "abcdefghijABCDEFGHIJ",

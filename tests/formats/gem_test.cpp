@@ -11,16 +11,16 @@ namespace {
 
 using Bytes = std::vector<uint8_t>;
 
-// A header of 16 bytes and `more` words; planes, width and height as words.
+// A 16-byte header plus extension words; planes, width and height as words.
 std::string Header(const char* planes, const char* size, const char* words = "0008") {
   return std::string("0001 ") + words + planes + " 0002 0174 0174 " + size + "  ";
 }
-// A color table of XIMG for four colors.
+// An XIMG color table with four colors.
 const std::string kFour =
     "58494D47 0000  03E8 03E8 03E8  03E8 0000 0000  0000 01F4 0000  0000 0000 0000  ";
 
 TEST(Gem, ReadsItsKinds) {
-  const std::string two = " 80 02 55 33 ";  // a line of two planes of a byte each
+  const std::string two = " 80 02 55 33 ";  // a line of two planes of one byte each
   const struct {
     const char* name;
     std::string file;
@@ -83,7 +83,7 @@ TEST(Gem, DecodesLines) {
     const char* name;
     const char* code;
     size_t size, pattern;
-    std::vector<const char*> lines;  // and then the code ends
+    std::vector<const char*> lines;  // the rest is missing
   } rows[] = {
       {"every token", "82 03 80 02 12 34 00 02 AB CD", 11, 2, {"FFFF 000000 1234 ABCDABCD"}},
       {"a line that comes three times, then another", "00 00 FF 03 80 01 77 81", 1, 2, {"77", "77", "77", "FF"}},
@@ -133,7 +133,7 @@ TEST(Gem, EncodesLines) {
 
 TEST(Gem, WritesWhatOthersRead) {
   const PicturePointer mono = PatternPicture(9, 3, 1);
-  // black at the left
+  // black on the left
   for (int32_t i = 0; i < 27; ++i) SetPixel(mono->image, i % 9, i / 9, i % 9 != 0);
   EXPECT_EQ(Encode(GemWrite, *mono), Hex("0001 0008 0001 0001 0174 0174 0009 0003  00 00 FF 03  80 02 80 00"));
   mono->palette[0] = 255;  // red: it needs a palette

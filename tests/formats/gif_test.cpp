@@ -76,8 +76,8 @@ TEST(GifRead, Frames) {
 }
 
 TEST(GifRead, LaterFramesStandOnTheOnesBefore) {
-  // Two by one: red red, then a green pixel at the right with each disposal, then a blue one at the
-  // left.
+  // Two by one: red red, then a green pixel on the right with each disposal, then a blue one
+  // on the left.
   const auto file = [](const char* disposal) {
     return Gif("0200 0100 81 00 00 " + std::string(kPalette),
                "2C 0000 0000 0200 0100 00 02 02 4C 0A 00 "
@@ -94,7 +94,7 @@ TEST(GifRead, LaterFramesStandOnTheOnesBefore) {
   const Row rows[] = {
       {"04", "0000FF 00FF00", "255 255"},  // kept
       {"08", "0000FF 000000", "255 0"},    // cleared
-      {"0C", "0000FF FF0000", "255 255"},  // back to what was there
+      {"0C", "0000FF FF0000", "255 255"},  // restored
   };
   for (const Row& row : rows) {
     SCOPED_TRACE(row.disposal);
@@ -117,7 +117,7 @@ TEST(GifWrite, LongStringsAndFullTablesComeBack) {
     for (const int32_t bits : {1, 4, 8}) {
       SCOPED_TRACE(std::to_string(bits) + (interlaced ? " interlaced" : ""));
       const PicturePointer picture = PatternPicture(257, 211, bits);
-      // noise fills the table several times, the flat part makes strings of thousands
+      // noise fills the table several times, the flat part creates strings of thousands of bytes
       uint32_t seed = 1;
       for (int32_t y = 0; y < 150; ++y) {
         for (int32_t x = 0; x < 257; ++x) {

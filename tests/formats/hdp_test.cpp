@@ -18,8 +18,7 @@ namespace {
 TEST(Hdp, QuantizerZeroKeepsEveryPixelAndOthersStayClose) {
   if (!HdpWorksHere()) GTEST_SKIP() << "libjxr is not installed";
   const ScopedSettings scoped;
-  // A maker's name without the zero that ends a text: the peer does not read on where it is
-  // missing.
+  // A camera maker without the terminating NUL: the peer stops reading if it is missing.
   const std::vector<uint8_t> unendedText =
       Hex("4949 2A00 08000000  0100 0F01 0200 05000000 1A000000 00000000  4B6F64616B");
   struct Row {
@@ -55,7 +54,7 @@ TEST(Hdp, QuantizerZeroKeepsEveryPixelAndOthersStayClose) {
   }
 }
 
-// The library trusts its input and often does not survive it; the program must.
+// The library trusts its input and often crashes; the program must not.
 TEST(Hdp, DamagedDataNeverEndTheProgram) {
   if (!HdpWorksHere()) GTEST_SKIP() << "libjxr is not installed";
   const std::vector<uint8_t> good =
@@ -64,7 +63,7 @@ TEST(Hdp, DamagedDataNeverEndTheProgram) {
   const auto next = [&state](size_t below) {
     return (state = state * 1664525 + 1013904223) / 65536 % below;
   };
-  // How much of it a version of the library refuses differs; that nothing else happens does not.
+  // Library versions reject different parts of it, but must do nothing else.
   for (int turn = 0; turn < 200; ++turn) {
     std::vector<uint8_t> file = good;
     for (int i = 0; i < 2; ++i)
@@ -74,7 +73,7 @@ TEST(Hdp, DamagedDataNeverEndTheProgram) {
   }
 }
 
-// Stops the work as soon as rows come back.
+// Cancels as soon as rows are reported.
 class Stopping : public ProgressSink {
  public:
   void Step(int32_t, int32_t) override { source.Stop(); }
@@ -112,10 +111,10 @@ TEST(Hdp, ColorsThatWereMultipliedByAlphaAreDividedAgain) {
     for (int32_t x = 0; x < 12; ++x) {
       const int32_t alpha = decoded.picture->alpha.PixelAt(x, y);
       ASSERT_EQ(alpha, alphas[(x + y) % 5]);
-      const int32_t colors[] = {x * y * 7 % 256, y * 25, x * 20};  // that the picture was drawn in
+      const int32_t colors[] = {x * y * 7 % 256, y * 25, x * 20};  // of the original
       for (int c = 0; c < 3; ++c) {
         const int32_t color = alpha == 0 ? 0 : colors[c];
-        const int32_t most = alpha == 0 ? 0 : 255 / alpha + 1;  // what eight bits lose
+        const int32_t most = alpha == 0 ? 0 : 255 / alpha + 1;  // rounding error of eight bits
         EXPECT_NEAR(decoded.picture->image.PixelAt(x, y) >> 8 * c & 255, color, most) << x << ", " << y;
         EXPECT_EQ(plain.picture->image.PixelAt(x, y) >> 8 * c & 255, colors[c] * alpha / 255) << x << ", " << y;
       }
@@ -125,11 +124,11 @@ TEST(Hdp, ColorsThatWereMultipliedByAlphaAreDividedAgain) {
 
 TEST(Hdp, DirectoriesThatLeadBackToThemselvesEnd) {
   std::vector<uint8_t> file = ReadBytes(SourcePath("tests/formats/hdp/good/tiles-by-place.hdp"));
-  const auto link = [&file] {  // behind the first directory
+  const auto link = [&file] {  // after the first directory
     const size_t at = static_cast<size_t>(file[4] | file[5] << 8);
     return at + 2 + 12 * static_cast<size_t>(file[at]);
   }();
-  // it leads back to itself
+  // links back to itself
   std::copy_n(file.begin() + 4, 4, file.begin() + static_cast<ptrdiff_t>(link));
   const Decoded info = Describe(HdpInfo, file);
   EXPECT_EQ(info.status, Status::Ok);

@@ -15,11 +15,11 @@ namespace {
 
 using Bytes = std::vector<uint8_t>;
 
-// A directory of one entry for the picture that follows.
+// A directory with one entry for `picture`.
 std::string OneIcon(const std::string& picture) {
   return "0000 0100 0100  02 01 00 00 0100 2000 FFFFFFFF 16000000 " + picture;
 }
-// A bitmap header of two pixels by one.
+// A bitmap header for 2 x 1 pixels.
 std::string Bitmap(const char* bits, const std::string& rest) {
   return std::string("28000000 02000000 02000000 0100 ") + bits +
          " 00000000 00000000 00000000 00000000 00000000 00000000 " + rest;
@@ -78,7 +78,7 @@ TEST(IcoRead, TheLargestThenDeepestEntryWinsAndPagesSelect) {
   }
 }
 
-// PNG entries of one size: the directory tells how deep they are.
+// PNG entries of the same size: the directory has their depth.
 TEST(IcoRead, OfEqualSizesTheDeepestWins) {
   const auto shallow = Encode(PngWrite, *PatternPicture(20, 20, 4)),
              deep = Encode(PngWrite, *PatternPicture(20, 20, 24));

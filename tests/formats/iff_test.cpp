@@ -14,7 +14,7 @@ using Bytes = std::vector<uint8_t>;
 const std::string kIlbm = "464F524D 00000000 494C424D ", kPbm = "464F524D 00000000 50424D20 ";
 const std::string kColors = " 434D4150 0000000C  000000 102030 405060 FFFFFF ";
 
-// A header of columns and rows, then planes, masking and compression, then the transparent color.
+// A header: columns and rows, then planes, masking and compression, then the transparent color.
 std::string Header(const char* size, const char* kind, const char* transparent = "0000") {
   return std::string(" 424D4844 00000014 ") + size + " 00000000 " + kind + " 00 " + transparent +
          " 0101 00000000 ";
@@ -93,7 +93,7 @@ TEST(IffRead, Kinds) {
 }
 
 TEST(IffRead, PalettesOfOldPrograms) {
-  // Colors of 4 bits in the high half, and extra half-bright without a screen mode.
+  // 4-bit colors in the high half, and extra half-bright without a screen mode.
   const std::string nibbles = " 434D4150 00000006  F02000 804000 ";
   const Decoded old = Decode(
       IffRead,
@@ -125,13 +125,13 @@ TEST(IffWrite, ObeysItsKeys) {
   EXPECT_EQ(kindOf(), "ILBM 4 0");
   settings.CreateIffPBM = 1;
   EXPECT_EQ(kindOf(), "PBM  8 0");
-  // The padding of rows of odd width repeats the last pixel.
-  picture->image.Row(4)[16] = 0x90;  // two pixels a byte
+  // The padding of odd rows repeats the last pixel.
+  picture->image.Row(4)[16] = 0x90;  // two pixels per byte
   const Bytes file = Encode(IffWrite, *picture);
   EXPECT_EQ(Bytes(file.end() - 2, file.end()), Hex("09 09"));
 }
 
-// Rows of hold and modify begin with the first color; for some readers that is black.
+// HAM rows start with the first color; some readers assume black.
 TEST(IffWrite, FirstColorOfHamIsBlack) {
   const Bytes file = Encode(HamWrite, *PatternPicture(33, 5, 24));
   const std::string_view text(reinterpret_cast<const char*>(file.data()), file.size());

@@ -16,7 +16,7 @@ namespace {
 
 using Bytes = std::vector<uint8_t>;
 
-// Slow changes of color, which JPEG keeps closely.
+// Smooth gradients, which JPEG preserves well.
 PicturePointer SmoothPicture(int32_t width, int32_t height) {
   PicturePointer picture = PatternPicture(width, height, 24);
   for (int32_t y = 0; y < height; ++y) {
@@ -106,7 +106,7 @@ TEST(Jpeg, FaultsThatArePassedOverAreTold) {
   EXPECT_EQ(back.status, Status::Ok);
   EXPECT_FALSE(back.picture->warning.empty());
 
-  // A marker that the library does not know is odd and harms nothing.
+  // An unknown marker is odd but harmless.
   Bytes odd = Encode(JpegWrite, *PatternPicture(64, 64, 24));
   const Bytes jfif = {'J', 'F', 'I', 'F', 0, 1};
   const auto version = std::search(odd.begin(), odd.end(), jfif.begin(), jfif.end()) + 5;
@@ -117,11 +117,11 @@ TEST(Jpeg, FaultsThatArePassedOverAreTold) {
   EXPECT_FALSE(noted.picture->note.empty());
 }
 
-// A file of one block, 8 x 8, in which every component has one value. Huffman codes: 0 for 7 bits
-// that follow, 10 for 8 bits, 110 for the value 128 and, behind each, 0 for nothing more.
+// A file with one 8 x 8 block, where every component has a single value. Huffman codes: 0 for 7
+// bits that follow, 10 for 8 bits, 110 for the value 128; each is followed by 0 for end of block.
 Bytes OneBlock(const char* frame, const Bytes& scans) {
   Bytes file = Hex("FFD8  FFDB 0043 00");
-  file.insert(file.end(), 64, 8);  // every step is 8, so that a coefficient is the value less 128
+  file.insert(file.end(), 64, 8);  // quantizers of 8, so that a coefficient is the value minus 128
   const Bytes tables =
       Hex("FFC4 0016 00 010101 00000000000000000000000000 070800"
           "FFC4 0014 10 01 000000000000000000000000000000 00");
@@ -152,7 +152,7 @@ TEST(Jpeg, InkBecomesLight) {
   }
 }
 
-// Every scan costs a pass over the picture, though it takes ten bytes.
+// Every scan takes a pass over the picture, but only ten bytes.
 TEST(Jpeg, ScansWithoutEndAreRefused) {
   for (const int count : {1, 400, 600}) {
     SCOPED_TRACE(count);
@@ -188,7 +188,7 @@ TEST(Jpeg, SaysWhatNoSegmentHolds) {
   const PicturePointer picture = PatternPicture(8, 8, 24);
   picture->metadata.exif.assign(70000, 1);
   picture->metadata.xmp.assign(70000, 'x');
-  picture->metadata.icc.assign(70000, 2);  // goes into two
+  picture->metadata.icc.assign(70000, 2);  // needs two segments
   const Decoded back = Decode(JpegRead, Encode(JpegWrite, *picture));
   EXPECT_EQ(picture->lostMetadata, kLostExif | kLostXmp);
   EXPECT_TRUE(back.picture->metadata.exif.empty());

@@ -13,14 +13,14 @@ namespace {
 
 using Bytes = std::vector<uint8_t>;
 
-// A TIFF file of either byte order, built from directories whose values stand behind them.
+// A TIFF file of either byte order; values follow their directories.
 class TiffFile {
  public:
   explicit TiffFile(bool big) : big_(big) {
     bytes_ = big ? Bytes{'M', 'M', 0, 42} : Bytes{'I', 'I', 42, 0};
     Put(bytes_, 8, 4);
   }
-  // Data of a picture; where they are.
+  // Appends data; returns their offset.
   uint32_t Data(const Bytes& data) {
     const auto place = static_cast<uint32_t>(bytes_.size());
     bytes_.insert(bytes_.end(), data.begin(), data.end());
@@ -31,7 +31,7 @@ class TiffFile {
     uint16_t tag, type;
     std::vector<uint32_t> values;
   };
-  // A directory; its own place.
+  // Appends a directory; returns its offset.
   uint32_t Directory(const std::vector<Entry>& entries, uint32_t next = 0) {
     std::vector<uint32_t> values;
     for (const Entry& entry : entries) values.push_back(Values(entry));
@@ -87,7 +87,7 @@ std::vector<uint32_t> Letters(const char* text) {
 
 constexpr uint32_t kSide = 64;
 
-// A digital negative of 64 x 48 pixels: a sensor of red, green, green, blue, its left half lit.
+// A DNG of 64 x 48 pixels: a red, green, green, blue sensor with its left half lit.
 Bytes SensorFile(uint32_t rows = 48) {
   TiffFile file(false);
   Bytes sensor;
@@ -121,8 +121,8 @@ Bytes SensorFile(uint32_t rows = 48) {
 
 Bytes Jpeg(int32_t width) { return Encode(JpegWrite, *PatternPicture(width, 20, 24)); }
 
-// A file of an unknown camera with a preview of 2 x 1 pixels, red and green, and JPEG ones that
-// other directories lead to.
+// A file of an unknown camera with a preview of 2 x 1 pixels, red and green, and JPEG previews in
+// other directories.
 Bytes PreviewFile(bool big, bool jpeg) {
   TiffFile file(big);
   const uint32_t rgb = file.Data({255, 0, 0, 0, 255, 0});
@@ -157,7 +157,7 @@ TEST(Kdc, SensorDataAreDeveloped) {
   EXPECT_EQ(described.picture->height, 48);
   const int32_t lit = image.PixelAt(8, 24), dark = image.PixelAt(56, 24);
   EXPECT_GT(lit & 255, (dark & 255) + 100);
-  EXPECT_NEAR(lit & 255, lit >> 16 & 255, 12);  // a neutral gray stays one
+  EXPECT_NEAR(lit & 255, lit >> 16 & 255, 12);  // neutral gray
   EXPECT_TRUE(decoded.picture->note.empty());
 }
 
@@ -180,7 +180,7 @@ TEST(Kdc, PreviewsStandInForUnknownCameras) {
 TEST(Kdc, OtherFilesAreRefused) {
   TiffFile empty(false), loop(true);
   constexpr uint32_t next = 8;
-  (void)empty.Data(Bytes(200));  // the library looks at no shorter file
+  (void)empty.Data(Bytes(200));  // the library rejects shorter files
   (void)loop.Data(Bytes(200));
   const Bytes nothing = empty.Finish(empty.Directory({{256, 4, {2}}}));
   const Bytes looped = loop.Finish(loop.Directory({{330, 4, {8, 8, 9, 0xFFFFFFFF}}}, next));

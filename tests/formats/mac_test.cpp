@@ -33,7 +33,7 @@ Bytes Join(std::initializer_list<Bytes> parts) {
   for (const Bytes& part : parts) all.insert(all.end(), part.begin(), part.end());
   return all;
 }
-// Packed rows that are white from the first column to the last.
+// Packed rows that are completely white.
 Bytes WhiteRows(size_t count) {
   Bytes rows;
   for (; count > 0; --count) rows.insert(rows.end(), {0xB9, 0x00});
@@ -147,7 +147,7 @@ TEST(Mac, MacBinaryHeaderIsTheSameInEveryTimeZone) {
     ASSERT_EQ(MacWrite(*picture, {.encode = EncodeOptionsFromSettings()}), Status::Ok);
     const Bytes written = ReadBytes(path);
     ASSERT_EQ(written.size(), 128u + 512 + 720 * 4);
-    EXPECT_EQ(Bytes(written.begin(), written.begin() + 2), Hex("00 26"));  // version, length of the name
+    EXPECT_EQ(Bytes(written.begin(), written.begin() + 2), Hex("00 26"));  // version, name length
     EXPECT_EQ(std::string(written.begin() + 2, written.begin() + 2 + 38), name);
     EXPECT_EQ(Bytes(written.begin() + 40, written.begin() + 65), Times(25, 0));
     EXPECT_EQ(Bytes(written.begin() + 65, written.begin() + 128), Join({behindName, Times(29, 0)}));
@@ -175,7 +175,7 @@ TEST(Mac, NamesAreCutTo63) {
   Bytes written = ReadBytes(path);
   EXPECT_EQ(written[1], 63);
   EXPECT_EQ(std::string(written.begin() + 65, written.begin() + 69), "PNTG");
-  written[1] = 255;  // a length that the field cannot hold
+  written[1] = 255;  // beyond the size of the field
   WriteBytes(path, written);
   ASSERT_EQ(MacInfo(*picture, {.fileName = path}), Status::Ok);
   EXPECT_EQ(picture->typeName.view(), "A" + std::string(62, 'a'));
@@ -187,7 +187,7 @@ TEST(Mac, PutsThePictureOnAWhitePage) {
   for (const int32_t width : {1, 7, 8, 33, 570, 575, 576, 577, 1000}) {
     for (const int32_t height : {1, 719, 720, 721}) {
       SCOPED_TRACE(std::to_string(width) + " x " + std::to_string(height));
-      const PicturePointer picture = MakePicture(width, height, 1);  // black, its padding too
+      const PicturePointer picture = MakePicture(width, height, 1);  // black, including padding
       ASSERT_TRUE(picture->fileName.Assign(path));
       ASSERT_EQ(MacWrite(*picture, {.encode = EncodeOptionsFromSettings()}), Status::Ok);
       const PicturePointer again = NewPictureRecord();
@@ -216,7 +216,7 @@ TEST(Mac, RefusesWithItsStatus) {
   EXPECT_TRUE(folder.Names().empty());
 }
 
-// The same pictures in the eyes of netpbm, both ways.
+// Compared with netpbm, in both directions.
 TEST(Mac, AgreesWithNetpbm) {
   if (!HasProgram("macptopbm") || !HasProgram("pbmtomacp"))
     GTEST_SKIP() << "netpbm is not installed";

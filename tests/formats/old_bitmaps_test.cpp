@@ -74,7 +74,7 @@ TEST(OldBitmaps, ColorsOfSixBits) {
   EXPECT_EQ(Decode(HrzRead, file).status, Status::DamagedFile);
 }
 
-// A file of three rows of two pixels, black only at the top left, whose rows lie as a record says.
+// A file of three rows of two pixels, black only at the top left, oriented by a record.
 Bytes Drawing(const std::string& records) {
   const PicturePointer picture = PatternPicture(2, 3, 1);
   for (int32_t i = 0; i < 6; ++i) SetPixel(picture->image, i % 2, i / 2, i > 0);
@@ -104,7 +104,7 @@ TEST(OldBitmaps, DrawingsAreTurnedUpright) {
   EXPECT_EQ(Decode(CalsRead, file).status, Status::FileReadError);
 }
 
-// White on black is stored as such, whichever of the two colors comes first in the palette.
+// White on black is stored as such, in whichever order the palette has the two colors.
 TEST(OldBitmaps, TheDarkerColorIsBlack) {
   const PicturePointer picture = PatternPicture(8, 1, 1);
   for (int32_t x = 0; x < 8; ++x) SetPixel(picture->image, x, 0, x == 0);

@@ -15,7 +15,7 @@ namespace {
 
 using Bytes = std::vector<uint8_t>;
 
-// Bits as digits, in any grouping, as bytes.
+// Bytes from binary digits in any grouping.
 Bytes Bits(std::string_view digits) {
   Bytes bytes;
   size_t count = 0;
@@ -28,14 +28,14 @@ Bytes Bits(std::string_view digits) {
 }
 
 const std::string kMark = "11111111 11111111 11111110 ";
-// The beginning of a row of deltas.
+// The start of a row of deltas.
 std::string Row(const char* plane, int32_t row) {
   std::string digits = kMark + plane;
   for (int bit = 12; bit >= 0; --bit) digits += (row >> bit & 1) != 0 ? '1' : '0';
   return digits + "0 ";
 }
 
-// 0: no change, 10: one more, 110: 100 less, 1110 0000 0000 1: 5 more
+// 0: no change, 10: plus 1, 110: minus 100, 1110 0000 0000 1: plus 5
 const char* const kCode = "03  00 0000 00  01 8000 01  02 C000 9C  0C E008 05";
 
 TEST(PcdCode, Tables) {
@@ -148,7 +148,7 @@ TEST(PhotoYcc, Colors) {
   }
 }
 
-// A file with the smallest sizes: gray, and white in the first two pixels of the first row.
+// A file with the smallest resolutions: gray, with white in the first two pixels of the first row.
 Bytes PlainFile(int32_t sizes, uint8_t turns = 0) {
   constexpr uint64_t kBegins[] = {0x2000, 0xB800, 0x30000};
   const auto last = static_cast<size_t>(sizes - 1);
@@ -235,10 +235,10 @@ TEST(PcdRead, Refused) {
   EXPECT_EQ(Decode(PcdRead, std::span(overview).first(20000)).status, Status::FileReadError);
   const Decoded pages = Decode(PcdRead, overview);
   EXPECT_EQ(pages.status, Status::Ok);
-  EXPECT_EQ(pages.picture->pageCount, 2);  // more than two are not there
+  EXPECT_EQ(pages.picture->pageCount, 2);  // there are no more than two
 }
 
-// All of a file up to 1536 x 1024, with one row of deltas.
+// A complete file up to 1536 x 1024, with one row of deltas.
 Bytes LargerFile() {
   Bytes file = PlainFile(3);
   file.resize(388 * 2048);
@@ -262,7 +262,7 @@ TEST(PcdRead, DeltasOfALargerSize) {
   EXPECT_EQ(decoded.picture->image.PixelAt(4, 8), 0x888888);
   file.resize(file.size() - 8);
   EXPECT_EQ(Decode(PcdRead, file).status, Status::FileReadError);
-  file[388 * 2048] = 0;  // no code: then the size is not there
+  file[388 * 2048] = 0;  // without a code table the resolution does not exist
   EXPECT_EQ(Decode(PcdRead, file).picture->image.Width(), 768);
 }
 

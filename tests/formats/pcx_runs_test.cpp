@@ -11,7 +11,7 @@ namespace {
 
 using Bytes = std::vector<uint8_t>;
 
-// The code as its definition has it, a byte at a time.
+// A reference encoder, byte by byte.
 Bytes EncodePlainly(const Bytes& plane) {
   Bytes out;
   for (size_t i = 0; i < plane.size();) {
@@ -35,7 +35,8 @@ Bytes DecodePlainly(const Bytes& data) {
   return out;
 }
 
-// Random bytes of a few values around 0xC0 repeat their neighbour in `repeatPercent` of the places.
+// Random bytes from a few values around 0xC0, repeating the previous byte with
+// `repeatPercent` probability.
 Bytes Plane(size_t size, uint32_t seed, uint8_t first, uint8_t values, uint32_t repeatPercent) {
   Bytes plane = RandomBytes(size, seed);
   const Bytes chances = RandomBytes(size, seed + 1000);

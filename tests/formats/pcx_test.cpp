@@ -19,7 +19,7 @@ struct Header {
   uint8_t version = 5;
 };
 
-// A file whose header palette begins 010203 040506 and whose data are given in hexadecimal.
+// A file whose header palette starts with 010203 040506, with its data in hex.
 Bytes Pcx(const Header& header, std::string_view data) {
   Bytes bytes(128);
   bytes[0] = 10;
@@ -201,7 +201,7 @@ TEST(PcxWrite, WholeFiles) {
     PicturePointer picture;
     Bytes begin;  // the header
     Bytes tokens;
-    Bytes trailer;  // where it begins
+    Bytes trailer;  // the palette
   };
   const Row rows[] = {
       {"1 bit",

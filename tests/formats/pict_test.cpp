@@ -8,13 +8,13 @@
 namespace fotomill::test {
 namespace {
 
-// A version 2 picture of 1 row and 2 columns without the preamble.
+// A version 2 picture with 1 row and 2 columns, without the preamble.
 const std::string kHead =
     "0000 0000 0000 0001 0002  0011 02FF  0C00 FFFE 0000 00480000 00480000 0000 0000 0001 0002 "
     "00000000 ";
 const std::string kSquares = " 0000 0000 0001 0002  0000 0000 0001 0002  0000 ";
 
-// A direct pixel map: bytes of a row and pack type, then bits and parts.
+// A direct pixel map: row size and pack type, then bits and components.
 std::string Direct(const char* rowBytes, const char* packType, const char* bits,
                    const char* parts) {
   return std::string(" 009A 000000FF ") + rowBytes + " 0000 0000 0001 0002 0000 " + packType +
@@ -60,7 +60,7 @@ TEST(PictRead, Kinds) {
   }
 }
 
-// Two pieces side by side: each is drawn where it belongs, stretched to its place.
+// Two bitmaps side by side: each is scaled to its rectangle.
 TEST(PictRead, PiecesShareTheFrame) {
   const auto piece = [](const char* columns, const char* pixel) {
     return std::string(

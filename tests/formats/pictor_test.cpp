@@ -78,12 +78,12 @@ TEST(PictorWrite, WhatDoesNotFit) {
   EXPECT_EQ(status, Status::TooManyColors);
 }
 
-// A gray JPEG stream of 8 x 8 pixels of one brightness, without tables: its one coefficient is
-// `difference` times the first quantizer.
+// A gray JPEG stream of 8 x 8 equal pixels, without tables: its only coefficient is `difference`
+// times the first quantizer.
 Bytes BareStream(const char* codes, const char* frame = "C0") {
   Bytes stream = Hex("FFD8");
   if (*codes != 0) stream = Joined({stream, Hex("FFE1 0009 50494300"), Hex(codes)});
-  // the code of T.81, K.3 for 3 bits of luma is 100; 4 follows as 100, and 1010 ends the block
+  // the code in T.81, K.3 for 3 luma bits is 100; 4 follows as 100, and 1010 ends the block
   return Joined({stream, Hex("FF"), Hex(frame), Hex("000B 08 0008 0008 01 01 11 00"),
                  Hex("FFDA 0008 01 01 00 00 3F 00"), Hex("92 BF FFD9")});
 }

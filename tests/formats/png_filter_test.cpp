@@ -7,7 +7,7 @@
 namespace fotomill::test {
 namespace {
 
-// The filters as the format defines them, byte by byte.
+// Reference implementation of the filters, byte by byte.
 uint8_t Predicted(PngFilter filter, int left, int above, int corner) {
   const int estimate = left + above - corner;
   const int distances[] = {std::abs(estimate - left), std::abs(estimate - above),

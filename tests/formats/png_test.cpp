@@ -31,20 +31,20 @@ TEST(Png, MetadataTravels) {
   EXPECT_TRUE(without.picture->metadata.Empty());
 }
 
-// Bands are deflated apart: their streams must be joined without a gap, and the checks over all of
-// them be right.
+// Bands are deflated separately: their streams must be joined without a gap, and the checksum must
+// cover all of them.
 TEST(Png, BandsBecomeOneStream) {
   const ScopedSettings scoped;
   const TemporaryFolder folder;
   struct Row {
     int32_t level, width, height;
   };
-  // nine bands, and twice two
+  // nine bands, and two bands twice
   for (const Row& row : {Row{0, 3500, 3600}, Row{1, 1600, 900}, Row{9, 1600, 900}}) {
     SCOPED_TRACE(row.level);
     settings.PngCompression = row.level;
     const PicturePointer picture = PatternPicture(row.width, row.height, 24);
-    for (int32_t y = 100; y < 800; ++y) {  // smooth places make blocks of another kind
+    for (int32_t y = 100; y < 800; ++y) {  // smooth areas produce other block types
       for (size_t i = 0; i < 3000; ++i) picture->image.Row(y)[i] = static_cast<uint8_t>(y + i / 30);
     }
     const std::vector<uint8_t> file = Encode(PngWrite, *picture);
@@ -59,11 +59,10 @@ TEST(Png, BandsBecomeOneStream) {
   }
 }
 
-// The first row of a band differs from the row above, which belongs to the band before.
+// The first row of a band is filtered against the last one of the previous band.
 TEST(Png, RowsAreFilteredAcrossTheEndsOfBands) {
   const PicturePointer picture = PatternPicture(1600, 900, 24);  // two bands
-  // Every pixel is half of its left one, so that Average serves best under a row of zeros, which is
-  // not there.
+  // Every pixel is half of its left neighbor, so that Average would be best below a row of zeros.
   for (int32_t y = 0; y < 900; ++y) {
     for (size_t i = 0; i < 4800; ++i)
       picture->image.Row(y)[i] = static_cast<uint8_t>((128 >> i / 3 % 8) + y % 4);
@@ -78,7 +77,7 @@ TEST(Png, RowsAreFilteredAcrossTheEndsOfBands) {
   ASSERT_TRUE(RunShell("pngtopnm " + folder.Path("a.png") + " > " + folder.Path("a.ppm")));
   const std::vector<uint8_t> seen = ReadBytes(folder.Path("a.ppm"));
   ASSERT_GT(seen.size(), 900u * 4800);
-  for (size_t y = 0; y < 900; ++y) {  // red first there
+  for (size_t y = 0; y < 900; ++y) {  // red first in the file
     ASSERT_EQ(seen[seen.size() - (900 - y) * 4800], picture->image.Row(static_cast<int32_t>(y))[2]) << y;
   }
 }
@@ -101,13 +100,13 @@ TEST(Png, BrokenFilesFailWithTheirStatus) {
   flipped[file.size() / 2] ^= 0x55;
   EXPECT_EQ(Decode(PngRead, flipped).status, Status::DamagedFile);
   EXPECT_EQ(Decode(PngRead, std::span(file).first(file.size() / 2)).status, Status::FileReadError);
-  // sizes that no memory holds, and a CRC that no longer fits: refused either way
+  // impossible sizes, and a wrong CRC: rejected either way
   std::vector<uint8_t> huge = file;
   for (size_t i = 16; i < 24; ++i) huge[i] = 0x7f;
   EXPECT_NE(Decode(PngRead, huge).status, Status::Ok);
   std::vector<uint8_t> claims = file;  // a text of 640 MB in a small file
   constexpr uint8_t kText[] = {0x28, 0, 0, 0, 'z', 'T', 'X', 't'};
-  claims.insert(claims.begin() + 33, std::begin(kText), std::end(kText));  // behind IHDR
+  claims.insert(claims.begin() + 33, std::begin(kText), std::end(kText));  // after IHDR
   EXPECT_EQ(Decode(PngRead, claims).status, Status::FileReadError);
 }
 

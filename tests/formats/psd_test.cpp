@@ -14,7 +14,7 @@ using Bytes = std::vector<uint8_t>;
 const std::string kNoTable = " 00000000", kNoResources = " 00000000", kNoLayers = " 00000000",
                   kPlain = " 0000 ";
 
-// Channels, rows, columns, bits and mode of a header.
+// A header with channels, rows, columns, bits and mode.
 std::string Head(const char* fields) { return std::string("38425053 0001 000000000000 ") + fields; }
 std::string Flat(const char* fields) { return Head(fields) + kNoTable + kNoResources + kNoLayers; }
 
@@ -104,7 +104,7 @@ TEST(PsdRead, Kinds) {
   }
 }
 
-// A gray picture of 2 x 1 without a merged one: a layer that hangs over the left edge.
+// A gray picture of 2 x 1 without a merged picture: a layer that extends beyond the left edge.
 TEST(PsdRead, LayersWhereTheMergedPictureIsMissing) {
   const std::string sides = "00000000 FFFFFFFF 00000001 00000001";
   const std::string layer =

@@ -21,8 +21,8 @@ Bytes operator+(Bytes a, const Bytes& b) {
   return a;
 }
 
-// Makes files of one version: 3 has the size of a block's first part in the block, later ones in
-// the part.
+// Creates files of one version: 3 has the size of a block's first part in the block header, later
+// ones in the part.
 struct Maker {
   size_t version;
 
@@ -41,7 +41,7 @@ struct Maker {
                         Number(compression, 2) + Number(bits, 2) + Number(1, 2) + Number(0, 4) +
                         Number(0, 1) + Number(0, 4 + 4) + Number(1, 2));
   }
-  // A layer in one row from `left` to `right`.
+  // A one-row layer from `left` to `right`.
   Bytes Layer(size_t left, size_t right, size_t opacity, const Bytes& channels) const {
     const Bytes sides = Number(left, 4) + Number(0, 4) + Number(right, 4) + Number(1, 4);
     const Bytes name = version < 4 ? Bytes(256) : Number(1, 2) + Hex("41");

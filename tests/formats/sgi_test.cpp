@@ -12,7 +12,7 @@ namespace {
 
 using Bytes = std::vector<uint8_t>;
 
-// A header with the fields that count, and what follows it.
+// A header with the given fields, followed by data.
 Bytes File(const char* fields, const char* data) {
   Bytes file = Hex(fields);
   file.resize(512);

@@ -37,7 +37,7 @@ Picture Noise(const char* name, int32_t width, int32_t height, int32_t sparse) {
   return picture;
 }
 
-// Long runs of both colors that move a little from row to row.
+// Long runs of both colors that shift slightly from row to row.
 Picture Bars(int32_t width, int32_t height) {
   Picture picture{"bars", width, height, {}};
   picture.rows.resize(RowBytes(picture) * static_cast<size_t>(height));

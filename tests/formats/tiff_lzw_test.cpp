@@ -17,7 +17,7 @@ Bytes Decoded(const Bytes& coded, size_t size) {
 }
 
 TEST(TiffLzw, CodesAsDefined) {
-  // The example of the format's document: clear, 7, 258, 8, 8, 258, 6, 6, end, of 9 bits each.
+  // The example in the specification: clear, 7, 258, 8, 8, 258, 6, 6, end, 9 bits each.
   const Bytes plain = Hex("07 07 07 08 08 07 07 06 06"),
               coded = Hex("80 01 E0 40 80 44 08 0C 06 80 80");
   Bytes made;
@@ -30,7 +30,7 @@ TEST(TiffLzw, CodesAsDefined) {
 TEST(TiffLzw, EverythingComesBack) {
   TiffLzwEncoder encoder;
   Bytes coded;
-  // around the ends of tables and widths
+  // around table resets and width changes
   for (const size_t size : {1, 2, 3, 255, 511, 3838, 3839, 3840, 10000, 70000}) {
     Bytes noise = RandomBytes(size, 5), few = noise, same(size, 9), runs = noise;
     for (size_t i = 0; i < size; ++i) {

@@ -15,8 +15,8 @@
 namespace fotomill::test {
 namespace {
 
-// A little-endian page of one uncompressed strip: its entries, 12 bytes each, then what they point
-// to and the pixels.
+// A little-endian page with one uncompressed strip: its entries, 12 bytes each, then their values
+// and the pixels.
 constexpr size_t kPageEnd = 8 + 2 + 8 * 12 + 4;
 std::vector<uint8_t> Page(uint32_t width, uint32_t height, uint16_t bits, uint16_t photometric,
                           uint16_t samples, uint16_t lastTag, uint32_t lastValue,
@@ -97,7 +97,7 @@ TEST(Tiff, ColorMapsHoldSixteenBitsOrEight) {
     SCOPED_TRACE(row.name);
     std::vector<uint8_t> file = Page(4, 1, 2, kPalette, 1, kColorMap, kPageEnd + 1, pixels);
     file[kPageEnd - 14] = 3;   // shorts
-    file[kPageEnd - 12] = 12;  // so many
+    file[kPageEnd - 12] = 12;  // count
     const std::vector<uint8_t> map = Hex(row.map);
     file.insert(file.end(), map.begin(), map.end());
     const Decoded decoded = Decode(TiffRead, file);
@@ -122,7 +122,7 @@ TEST(Tiff, BrokenFilesFailWithTheirStatus) {
   std::vector<uint8_t> cut = Page(8, 8, 8, 1, 1, 339, 1, pixels), foreign = cut, loop = cut;
   cut.pop_back();
   foreign[2] = 41;
-  // the next page is the same one
+  // links back to itself
   loop[kPageEnd - 4] = 8;
   // a row of 240 GB, run-length coded
   std::vector<uint8_t> bomb = Page(4000000, 1, 8, 1, 60000, 259, 32773, pixels);
@@ -148,7 +148,7 @@ TEST(Tiff, FilesCutShortEndCleanly) {
   for (size_t length = 0; length < bare.size(); ++length) {
     EXPECT_NE(Decode(TiffRead, std::span(bare).first(length)).status, Status::Ok) << length;
   }
-  // its directory is last: the end may be a text's
+  // the directory is last: the file may end with a text
   for (size_t length = 0; length < packed.size(); ++length) {
     const Decoded decoded = Decode(TiffRead, std::span(packed).first(length));
     EXPECT_EQ(decoded.picture->image.Empty(), decoded.status != Status::Ok) << length;
@@ -177,10 +177,10 @@ TEST(Tiff, MetadataTravels) {
   settings.PreserveEXIF = 0;
   const Decoded bare = Decode(TiffRead, Encode(TiffWrite, *picture));
   EXPECT_TRUE(bare.picture->metadata.exif.empty() && bare.picture->metadata.xmp.empty());
-  EXPECT_EQ(bare.picture->metadata.icc, picture->metadata.icc);  // it belongs to the colors
+  EXPECT_EQ(bare.picture->metadata.icc, picture->metadata.icc);  // belongs to the colors
 }
 
-// Large enough for several strips and for the writer to patch a header that is on disk already.
+// Large enough for several strips and for patching a header that was already flushed.
 TEST(Tiff, EveryCompressionKeepsEveryPixel) {
   const ScopedSettings scoped;
   for (int32_t option = choice::kTiffNone; option < choice::kTiffJpeg; ++option) {
@@ -192,7 +192,7 @@ TEST(Tiff, EveryCompressionKeepsEveryPixel) {
       ASSERT_EQ(back.status, Status::Ok);
       if (bits > 1 || option != choice::kTiffCcitt) {
         EXPECT_TRUE(SamePixels(picture->image, back.picture->image));
-      } else {  // black on white
+      } else {  // white is 0
         EXPECT_EQ(back.picture->image.ColorTable()[0], 255);
         EXPECT_EQ(picture->image.Row(5)[3] ^ 0xFF, back.picture->image.Row(5)[3]);
       }

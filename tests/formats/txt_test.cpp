@@ -62,7 +62,7 @@ TEST(Txt, BreaksLongLinesAndCutsLongTexts) {
   ASSERT_TRUE(ReadTextLines(Bytes(5001, '\n'), true, more));
   EXPECT_TRUE(more.cutShort);
   EXPECT_EQ(more.lines.size(), 5000u);
-  ASSERT_TRUE(ReadTextLines(BytesOf("a\xe2\x82"), false, part));  // ends within a character
+  ASSERT_TRUE(ReadTextLines(BytesOf("a\xe2\x82"), false, part));  // cut within a character
   EXPECT_EQ(part.coding, TextCoding::Utf8);
   EXPECT_TRUE(part.cutShort);
 }
@@ -75,7 +75,7 @@ TEST(Txt, DrawsGlyphs) {
   EXPECT_EQ(image.Width(), 2 * 8 + 16);
   EXPECT_EQ(image.Height(), 2 * 13 + 16);
   const GlyphRows& glyph = GlyphOf('A');
-  EXPECT_EQ(glyph[7], 0x7e);  // its bar
+  EXPECT_EQ(glyph[7], 0x7e);  // the bar of the letter
   for (int32_t y = 0; y < image.Height(); ++y) {
     const int32_t inLine = y - 8 - 13;
     const bool drawn = inLine >= 0 && inLine < 13;
@@ -96,7 +96,7 @@ TEST(Txt, DrawsGlyphs) {
 
 TEST(Txt, WritesBrightnessAsCharacters) {
   const ScopedSettings scope;
-  // White to black in 15 steps, in two rows and one of white alone.
+  // White to black in 15 steps in two rows, then one white row.
   const PicturePointer picture = PatternPicture(15, 3, 24);
   for (int32_t x = 0; x < 15; ++x) {
     const int32_t gray = 255 - x * 255 / 14;
@@ -110,7 +110,7 @@ TEST(Txt, WritesBrightnessAsCharacters) {
   const std::pair<const char*, const char*> levels[] = {
       {" \xe2\x96\x91\xe2\x96\x88", "     \xe2\x96\x91\xe2\x96\x91\xe2\x96\x91\xe2\x96\x91\xe2\x96\x91\xe2\x96\x88\xe2\x96\x88\xe2\x96\x88\xe2\x96\x88\xe2\x96\x88"},
       {"\xff\x80", "        \xe2\x82\xac\xe2\x82\xac\xe2\x82\xac\xe2\x82\xac\xe2\x82\xac\xe2\x82\xac\xe2\x82\xac"},
-      {"\xc3\xbf#", "        #######"},  // as other tools store the blank
+      {"\xc3\xbf#", "        #######"},  // a blank, as stored by other tools
       {"", " .:-+|=%o#&XOB@"},
       {"x", " .:-+|=%o#&XOB@"},
       {"\t\n", " .:-+|=%o#&XOB@"},

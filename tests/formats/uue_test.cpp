@@ -19,7 +19,7 @@ using Bytes = std::vector<uint8_t>;
 
 Bytes BytesOf(std::string_view text) { return {text.begin(), text.end()}; }
 
-// A file as lines of text.
+// A uuencoded file.
 std::string Wrapped(const Bytes& bytes, std::string_view name) {
   const TemporaryFolder folder;
   ByteWriter out;
@@ -35,7 +35,7 @@ TEST(Uuencode, DecodesLines) {
     const char* text;
     Status strict, relaxed;
     const char* inner;
-    const char* bytes;  // when relaxed
+    const char* bytes;  // if relaxed
   } rows[] = {
       {"three bytes", "begin 644 a.gif\n#0V%T\n`\nend\n", Status::Ok, Status::Ok, "a.gif", "Cat"},
       {"one byte, blanks for 0", "begin 644 a.gif\n!80  \n \nend\n", Status::Ok, Status::Ok, "a.gif", "a"},
@@ -67,10 +67,10 @@ TEST(Uuencode, DecodesLines) {
   }
   UuencodedFile cut;
   ASSERT_EQ(DecodeUuencoded(BytesOf("begin 644 a\n#0V\n`\nend\n"), true, cut), Status::Ok);
-  EXPECT_EQ(cut.bytes, Hex("43 60 00"));  // what is missing is 0
+  EXPECT_EQ(cut.bytes, Hex("43 60 00"));  // missing data are 0
 }
 
-// Lines of nothing but their number give 22 times what they take.
+// Lines with only a byte count decode to 22 times their size.
 TEST(Uuencode, KeepsToTheLimitOfMemory) {
   const Limits saved = limits;
   limits.fileMemoryBytes = 10000;
@@ -87,7 +87,7 @@ TEST(Uuencode, EncodesLines) {
   Bytes long46(46);
   for (size_t i = 0; i < long46.size(); ++i) long46[i] = static_cast<uint8_t>(i * 37);
   const std::string text = Wrapped(long46, "x");
-  EXPECT_EQ(text.find('\n', 12) - 12, 61u);  // the line of 45 bytes
+  EXPECT_EQ(text.find('\n', 12) - 12, 61u);  // a line of 45 bytes
   UuencodedFile back;
   ASSERT_EQ(DecodeUuencoded(BytesOf(text), false, back), Status::Ok);
   EXPECT_EQ(back.bytes, long46);

@@ -27,7 +27,7 @@ TEST(Webp, LosslessKeepsEveryPixel) {
   const ScopedSettings scoped;
   settings.WebPLossless = 1;
   const PicturePointer plain = PatternPicture(50, 40, 24), transparent = TransparentPicture();
-  for (const bool metadata : {false, true}) {  // metadata change the file's layout
+  for (const bool metadata : {false, true}) {  // metadata changes the file's layout
     if (metadata) plain->metadata.xmp = transparent->metadata.xmp = {'<', 'x', '>'};
     const Decoded first = Decode(WebpRead, Encode(WebpWrite, *plain));
     ASSERT_EQ(first.status, Status::Ok);
@@ -45,7 +45,7 @@ TEST(Webp, MetadataTravels) {
   for (const bool alpha : {false, true}) {
     const PicturePointer picture = alpha ? TransparentPicture() : PatternPicture(5, 3, 24);
     picture->metadata.exif = {'I', 'I', 42, 0, 8, 0, 0, 0, 0, 0, 0, 0, 0, 0};
-    picture->metadata.xmp = {'<', 'x', '>'};  // of odd length
+    picture->metadata.xmp = {'<', 'x', '>'};  // odd size
     picture->metadata.icc.assign(131, 9);
     settings.PreserveEXIF = 1;
     const Decoded back = Decode(WebpRead, Encode(WebpWrite, *picture));
@@ -57,7 +57,7 @@ TEST(Webp, MetadataTravels) {
     settings.PreserveEXIF = 0;
     const Decoded bare = Decode(WebpRead, Encode(WebpWrite, *picture));
     EXPECT_TRUE(bare.picture->metadata.exif.empty() && bare.picture->metadata.xmp.empty());
-    EXPECT_EQ(bare.picture->metadata.icc, picture->metadata.icc);  // it belongs to the colors
+    EXPECT_EQ(bare.picture->metadata.icc, picture->metadata.icc);  // belongs to the colors
   }
 }
 
@@ -74,7 +74,7 @@ TEST(Webp, FramesAreDrawnOverEachOther) {
     const std::vector<uint8_t>& file;
     int32_t page;
     Status status;
-    const char *left, *middle, *right;  // 3, 12 and 20 from the left: alpha and color
+    const char *left, *middle, *right;  // at 3, 12 and 20 from the left: alpha and color
   };
   const Row rows[] = {
       {replacing, 0, Status::Ok, "255 ff0000", "255 ff0000", "0 000000"},

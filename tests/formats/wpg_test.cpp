@@ -90,7 +90,7 @@ TEST(Wpg, DecodesRows) {
     const char* name;
     const char* code;
     WpgCoding coding;
-    std::vector<const char*> rows;  // and then the code ends
+    std::vector<const char*> rows;  // the rest is missing
   } rows[] = {
       {"every token of version 1", "80 02 83 07 02 01 02", WpgCoding::Runs1, {"FFFF0707", }},
       {"a row that comes again", "84 07 00 02 84 09", WpgCoding::Runs1, {"07070707", "07070707", "07070707", "09090909"}},
@@ -127,7 +127,7 @@ TEST(Wpg, WritesVersionOne) {
   const PicturePointer wide = PatternPicture(65535, 2, 4);
   const Bytes file = Encode(WpgWrite, *wide);
   EXPECT_TRUE(SamePixels(Decode(WpgRead, file).picture->image, wide->image));
-  EXPECT_EQ(file[20] | file[21] << 8, 65535);  // its width on paper, at 1200 pixels an inch
+  EXPECT_EQ(file[20] | file[21] << 8, 65535);  // printed width, in 1/1200 inch
 }
 
 }  // namespace

@@ -184,8 +184,8 @@ TEST(Xbm, RefusesSizes) {
   EXPECT_EQ(folder.Names(), std::vector<std::string>{"size.xbm"});
 }
 
-// Texts of 20 MB in which every search starts anew take no longer than one pass, and one that holds
-// a value now and then is read to its end, while one without any is given up.
+// 20 MB texts in which every search fails take no longer than one pass; one with occasional values
+// is read to the end, one without any is rejected early.
 TEST(Xbm, ReadsLongTextsInOnePass) {
   const TemporaryFolder folder;
   const std::string path = folder.Path("long.xbm");
@@ -209,9 +209,9 @@ TEST(Xbm, ReadsLongTextsInOnePass) {
   }
 }
 
-// Where the width is no multiple of 8, others have the padding of a row behind it, and we in front
-// of it, which is on purpose: what they read of ours is to the right by as many pixels, what we
-// read of theirs to the left.
+// If the width is not a multiple of 8, others have the padding at the end of a row, and we at its
+// start, which is intentional: they read our files shifted to the right by that many pixels, we
+// read theirs shifted to the left.
 TEST(Xbm, AgreesWithNetpbmAtWholeBytes) {
   if (!HasProgram("xbmtopbm") || !HasProgram("pbmtoxbm")) GTEST_SKIP() << "netpbm is not installed";
   const TemporaryFolder folder;

@@ -1,4 +1,4 @@
-// What an independent reader says about the tags of real camera files, beside our texts.
+// Compares our texts for tags of real camera files with those of an independent reader.
 
 #include <gtest/gtest.h>
 
@@ -34,7 +34,7 @@ class TextsByTag : public ExifSink {
   std::string label_;
 };
 
-// Numbers such as "43/1 28/1" in our own form; characters stay.
+// Converts numbers such as "43/1 28/1" to our format; other texts are unchanged.
 std::string InOurForm(const std::string& type, const std::string& value) {
   if (type == "Ascii") return value;
   std::istringstream words(value);
@@ -66,7 +66,7 @@ TEST(ExifCameras, ValuesAgreeWithAnotherReader) {
     RunShell("exiv2 -q -PExgyv '" + path + "' > '" + folder.Path("lines") + "'");
     std::istringstream lines(ReadText(folder.Path("lines")));
     for (std::string line; std::getline(lines, line);) {
-      constexpr size_t kText = 31;  // the column behind tag, group and type
+      constexpr size_t kText = 31;  // column after tag, group and type
       std::string number, group, type, text = line.substr(std::min(kText, line.size()));
       if (!(std::istringstream(line) >> number >> group >> type) || !kDirectories.contains(group))
         continue;

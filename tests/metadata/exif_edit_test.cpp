@@ -47,7 +47,7 @@ TEST(ExifEdit, ReadsTheOrientation) {
     BlockBuilder blocks;
     blocks.Directory(row.entries);
     EXPECT_EQ(ExifOrientation(blocks.block), row.orientation);
-    blocks.block.resize(blocks.block.size() - 4);  // the link behind the entries is missing
+    blocks.block.resize(blocks.block.size() - 4);  // the link after the entries is missing
     EXPECT_EQ(ExifOrientation(blocks.block), row.orientation);
   }
 }
@@ -56,7 +56,7 @@ TEST(ExifEdit, SetsFactsInPlace) {
   for (const bool bigEndian : {true, false}) {
     Bytes block = bigEndian ? BigEndianBlock() : LittleEndianBlock(), expected = block;
     SetExifPictureFacts(block, {640, 480, 1});
-    expected[bigEndian ? 0x1f : 0x1e] = 1;  // nothing else was there to set
+    expected[bigEndian ? 0x1f : 0x1e] = 1;  // there was nothing else to set
     EXPECT_EQ(block, expected);
   }
   BlockBuilder blocks;
@@ -73,7 +73,7 @@ TEST(ExifEdit, DropsTheThumbnail) {
   for (Bytes block : {BigEndianBlock(), LittleEndianBlock()}) {
     auto lines = LinesOf(block);
     DropExifThumbnail(block);
-    lines.erase(lines.begin() + 6, lines.begin() + 10);  // the second directory, and nothing else
+    lines.erase(lines.begin() + 6, lines.begin() + 10);  // the second directory and nothing else
     EXPECT_EQ(LinesOf(block), lines);
     for (size_t i = 0x50; i < 0x7e; ++i)
       EXPECT_EQ(block[i], 0) << "nothing of it stays behind, offset " << i;
@@ -96,8 +96,8 @@ TEST(ExifEdit, CutsOffAThumbnailAtTheEnd) {
 }
 
 TEST(ExifEdit, DroppingSparesWhatTheThumbnailClaimsToCover) {
-  // The thumbnail is said to be the whole block, its directory to share the EXIF directory's place
-  // and to be its own successor.
+  // The thumbnail claims the whole block, and its directory shares the offset of the EXIF directory
+  // and links to itself.
   BlockBuilder blocks;
   blocks.Directory({kOrientation6, {0x8769, 4, 1, 38}}, 38);
   blocks.Directory({{0xa002, 3, 1, 10}, {0x0201, 4, 1, 8}, {0x0202, 4, 1, 0xffffffff}}, 38);
@@ -108,7 +108,7 @@ TEST(ExifEdit, DroppingSparesWhatTheThumbnailClaimsToCover) {
 
 TEST(ExifEdit, ReplacesTheThumbnail) {
   const Bytes small(10, 0xaa), large(3000, 0xbb);
-  BlockBuilder plain;  // has none before
+  BlockBuilder plain;  // without any before
   plain.Directory({kOrientation6});
   for (Bytes block : {BigEndianBlock(), LittleEndianBlock(), plain.block}) {
     const int32_t orientation = ExifOrientation(block);

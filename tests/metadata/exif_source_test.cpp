@@ -35,7 +35,7 @@ Bytes WebpChunk(std::string_view type, const Bytes& contents) {
 
 TEST(ExifSource, FindsTheBlockOfEveryKindOfFile) {
   const Bytes block = BigEndianBlock(), little = LittleEndianBlock(), none;
-  const Bytes mark = Hex("45786966 0000"), far(20000);  // more than the head that is read first
+  const Bytes mark = Hex("45786966 0000"), far(20000);  // beyond the head that is read first
   const Bytes start = Hex("FFD8"), app1 = Segment(0xe1, mark + block), scan = Hex("FFDA 0002");
   const Bytes png = Hex("89504E47 0D0A1A0A"), webp = Hex("52494646 00000000 57454250");
   const struct {
@@ -71,7 +71,7 @@ TEST(ExifSource, FindsTheBlockOfEveryKindOfFile) {
     WriteBytes(path, file.bytes);
     ASSERT_EQ(source.Open(path.c_str()), Status::Ok);
     EXPECT_EQ(Bytes(source.Block().begin(), source.Block().end()), file.block);
-    for (size_t size = file.bytes.size(); size > 0;) {  // cut anywhere it is no failure either
+    for (size_t size = file.bytes.size(); size > 0;) {  // no failure wherever it is truncated
       size -= size <= 64 ? 1 : std::min<size_t>(size - 64, size < 1024 ? 7 : 1001);
       std::filesystem::resize_file(path, size);
       ASSERT_EQ(source.Open(path.c_str()), Status::Ok);

@@ -49,7 +49,7 @@ TEST(ExifWalk, FindsTheSameInBothByteOrders) {
 
 constexpr uint16_t kWidth = 0x0100, kExif = 0x8769, kGps = 0x8825;
 
-// Directories one behind the other: the first at offset 8, of 6 bytes and 12 for each entry.
+// Consecutive directories: the first at offset 8, with 6 bytes plus 12 per entry.
 struct Trap {
   const char* name;
   // entries, next directory
@@ -108,12 +108,12 @@ TEST(ExifWalk, KeepsToItsLimitsAndSaysSo) {
   blocks.Directory(many);
   EXPECT_THAT(LinesOf(blocks.block, true), SizeIs(2 + 65536));
 
-  // A chain of directories, each at an offset of its own.
+  // A chain of directories at different offsets.
   BlockBuilder chain;
   for (uint32_t i = 1; i <= 600; ++i) chain.Directory({{kWidth, 3, 1, 1}}, 8 + 18 * i);
   EXPECT_THAT(LinesOf(chain.block, true), SizeIs(2 * limits.exifDirectories));
 
-  // One long text that many entries share.
+  // One long text shared by many entries.
   BlockBuilder texts;
   const uint32_t text = texts.Bytes(std::vector<uint8_t>(10000, 'x'));
   texts.Patch32(4,

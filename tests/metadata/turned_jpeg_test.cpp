@@ -66,7 +66,7 @@ TEST(TurnedJpeg, PixelsAreThoseOfJpegtran) {
                     LookAlike(ours, file));
         EXPECT_EQ(ExifOrientation(Decode(JpegRead, ours).picture->metadata.exif), number);
         const Bytes trimmed = Turned(file, {.turn = orientation, .trim = true}, result);
-        if (result.method == JpegTurnMethod::Tag) continue;  // there is no whole block
+        if (result.method == JpegTurnMethod::Tag) continue;  // no whole block
         ASSERT_EQ(result.method, JpegTurnMethod::Trimmed);
         ASSERT_TRUE(RunShell(command + "-trim " + old));
         EXPECT_TRUE(LookAlike(trimmed, ReadBytes(theirs)));
@@ -75,8 +75,8 @@ TEST(TurnedJpeg, PixelsAreThoseOfJpegtran) {
   }
 }
 
-// A file of which everything has to be turned: EXIF with sizes, orientation 6 and a thumbnail, XMP,
-// two resolutions.
+// A file with everything that has to be updated: EXIF with sizes, orientation 6 and a thumbnail,
+// XMP, two resolutions.
 Bytes FullFile(int32_t width, int32_t height, const PicturePointer& thumbnail) {
   const ScopedSettings scoped;
   settings.JpegStoreDPI = 1;
@@ -102,7 +102,7 @@ Bytes FullFile(int32_t width, int32_t height, const PicturePointer& thumbnail) {
 TEST(TurnedJpeg, WhatBelongsToAPictureTurnsWithIt) {
   struct Row {
     Orientation turn;
-    int32_t width, height, thumbnailWidth;  // of the thumbnail: 32 blocks fit, 30 does not
+    int32_t width, height, thumbnailWidth;  // of the thumbnail: 32 is whole blocks, 30 is not
     Orientation whole;
   };
   for (const Row& row : {Row{Orientation::Upright, 48, 64, 32, Orientation::QuarterRight},
@@ -128,8 +128,8 @@ TEST(TurnedJpeg, WhatBelongsToAPictureTurnsWithIt) {
     const Decoded thumbnail = Decode(JpegRead, ExifThumbnail(picture->metadata.exif, findings));
     ASSERT_EQ(thumbnail.status, Status::Ok);
     EXPECT_EQ(thumbnail.picture->width, SwapsSides(row.whole) ? 24 : row.thumbnailWidth);
-    // Seen as it is stored, it takes the turn alone; a turn that its orientation tells already
-    // changes nothing else.
+    // If its orientation tag is ignored, only the requested rotation applies; a rotation that the
+    // tag alone can express changes nothing else.
     const Bytes raw = Turned(file, {.turn = Orientation::HalfTurn, .seenByExif = false}, result);
     EXPECT_EQ(Decode(JpegRead, raw).picture->width, 64);
     (void)Turned(file, {.turn = Orientation::QuarterLeft}, result);
@@ -143,12 +143,12 @@ TEST(TurnedJpeg, UnfitFilesKeepTheirPixels) {
   Bytes flawed = sound, several = sound, split = sound;
   const auto middle = flawed.begin() + static_cast<std::ptrdiff_t>(flawed.size() - 400);
   middle[0] = 0xFF;
-  middle[1] = 0xD9;  // an end in the middle of the scan
+  middle[1] = 0xD9;  // an end marker in the middle of the scan
   const Bytes index = Hex("FFE20006 4D504600");
   several.insert(several.begin() + 2, index.begin(), index.end());
   JpegHead head;
   ASSERT_EQ(ParseJpegHead(sound, head), Status::Ok);
-  // goes on where the first EXIF segment ends
+  // continues the first EXIF segment
   const Bytes second = Hex("FFE1000A 457869660000 0102");
   split.insert(split.begin() + static_cast<std::ptrdiff_t>(head.scan), second.begin(),
                second.end());

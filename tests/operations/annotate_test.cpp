@@ -16,7 +16,7 @@ namespace {
 
 constexpr uint32_t kSea = 0x204060;
 
-// Keys as a configuration file holds them.
+// Keys as in a configuration file.
 using Keys = std::map<std::string, std::string>;
 
 Recipe Read(const std::string& text, const Keys& keys = {}) {
@@ -41,7 +41,7 @@ PicturePointer Plain(int32_t width, int32_t height, uint32_t color = kSea) {
   return MakePicture(width, height, [=](int32_t, int32_t) { return color; });
 }
 
-// The rectangle of pixels that are not of a color; width 0 if there are none.
+// The bounding box of pixels that differ from a color; width 0 if there are none.
 Rectangle Changed(const PictureRecord& picture, uint32_t color = kSea) {
   int32_t left = picture.width, right = 0, top = picture.height, bottom = 0;
   for (int32_t y = 0; y < picture.height; ++y) {
@@ -123,7 +123,7 @@ TEST(Caption, TakesItsDefaultsFromTheConfiguration) {
 
 TEST(Caption, StandsWhereItIsAligned) {
   const char* kAligns[] = {"left", "center", "right"};
-  const double expected[] = {10, 150, 290};  // left edge, middle, right edge of the letters
+  const double expected[] = {10, 150, 290};  // left edge, center, right edge of the letters
   for (size_t i = 0; i < 3; ++i) {
     const auto picture = Applied(
         Plain(300, 1, 0xffffff),
@@ -137,7 +137,7 @@ TEST(Caption, StandsWhereItIsAligned) {
 TEST(DrawnText, StandsWhereGravitySays) {
   const struct {
     const char* gravity;
-    double x, y;  // share of the room at the left and above
+    double x, y;  // position as a share of the free space
   } rows[] = {{"center", 0.5, 0.5}, {"top", 0.5, 0},       {"bottom", 0.5, 1},
               {"left", 0, 0.5},     {"right", 1, 0.5},     {"top-left", 0, 0},
               {"top-right", 1, 0},  {"bottom-left", 0, 1}, {"bottom-right", 1, 1}};
@@ -164,7 +164,7 @@ TEST(DrawnText, HasOutlineShadowBoxAndOpacity) {
   EXPECT_EQ(area("frame frame-size=2 padding=6").width, area("box padding=8").width);
   EXPECT_EQ(area("opacity=0").width, 0);
   EXPECT_NEAR(area("rotation=90").height, plain.width, 2);
-  // Half opaque: halfway between sea and white where letters cover whole pixels.
+  // Half opaque: halfway between sea and white where letters fully cover pixels.
   const auto half = Applied(Plain(100, 60),
                             "text HHH size=30px color=#ffffff opacity=50 font='DejaVu Sans Bold'");
   const auto colors = Colors(*half);
@@ -185,7 +185,7 @@ TEST(DrawnText, KeepsTransparencyAround) {
 
 class Watermarks : public testing::Test {
  protected:
-  // A logo of 20 x 10 pixels: its left half red and opaque, its right half transparent.
+  // A logo of 20 x 10 pixels: its left half is opaque red, its right half transparent.
   void SetUp() override {
     const auto logo = MakePicture(20, 10, [](int32_t, int32_t) { return 0xff0000u; });
     AddAlpha(*logo, [](int32_t x, int32_t) { return x < 10 ? 255 : 0; });
@@ -219,7 +219,7 @@ TEST_F(Watermarks, RepeatAsTiles) {
     for (int32_t x = 0; x < 100; ++x) {
       const bool mark = ColorAt(*picture, x, y) == 0xff0000;
       red += mark ? 1 : 0;
-      // Tiles are 25 pixels apart across and 15 down.
+      // Tiles are 25 pixels apart horizontally and 15 vertically.
       EXPECT_TRUE(x + 25 >= 100 || mark == (ColorAt(*picture, x + 25, y) == 0xff0000)) << x;
       EXPECT_TRUE(y + 15 >= 60 || mark == (ColorAt(*picture, x, y + 15) == 0xff0000)) << y;
     }

@@ -5,8 +5,7 @@
 #include "operations/engine.h"
 #include "processing/pictures.h"
 
-// Expected values are computed here from the formulas that docs/user/effects.md states, for a grid of
-// colors.
+// Expected values are computed from the formulas in docs/user/effects.md, for a grid of colors.
 namespace fotomill::test {
 namespace {
 
@@ -38,8 +37,8 @@ Formula Each(const std::function<double(double)>& value) {
 double Luma1000(const Rgb& c) { return 299 * c.red + 587 * c.green + 114 * c.blue; }
 Rgb Gray(double v) { return {v, v, v}; }
 
-// Rounded to nearest, ties up, then clamped. Sums that are ties on paper may be a hair below in
-// binary.
+// Rounded to nearest, ties up, then clamped. Sums that are ties in decimal may be slightly
+// lower in binary.
 uint32_t Level(double v) {
   return static_cast<uint32_t>(std::clamp(std::floor(v + 0.5 + 1e-9), 0.0, 255.0));
 }
@@ -133,7 +132,7 @@ TEST(Effects, FollowTheirFormulas) {
          return Rgb{c.green, c.blue, c.red};
        }},
       {"hue 360", Each([](double v) { return v; })},
-      {"hue 180",  // opposite: what is above the least channel is below the largest
+      {"hue 180",  // distances from the minimum and the maximum are exchanged
        [](const Rgb& c) {
          const double sum = std::max({c.red, c.green, c.blue}) + std::min({c.red, c.green, c.blue});
          return Rgb{sum - c.red, sum - c.green, sum - c.blue};
@@ -182,7 +181,7 @@ TEST(Effects, StretchLevelsAsTheirHistogramSays) {
       EXPECT_EQ(ColorAt(*picture, static_cast<int32_t>(x), 0) & 255, static_cast<uint32_t>(row.after[x])) << x;
     }
   }
-  // One histogram for all channels keeps grays gray; three do not.
+  // A common histogram for all channels keeps grays gray; separate ones do not.
   const auto makePair = [] {
     return MakePicture(2, 1, [](int32_t x, int32_t) { return x == 0 ? 0x204060u : 0x808080u; });
   };
@@ -218,7 +217,7 @@ TEST(Effects, VignetteDarkensCornersAndKeepsTheMiddle) {
   const uint32_t corner = ColorAt(*picture, 0, 0);
   EXPECT_EQ(corner, ColorAt(*picture, 100, 60));
   EXPECT_EQ(corner, ColorAt(*picture, 0, 60));
-  EXPECT_NEAR(corner >> 16, 227, 2);  // half way to red, within what the half pixel to the corner leaves
+  EXPECT_NEAR(corner >> 16, 227, 2);  // halfway to red, minus the half pixel to the corner
   EXPECT_NEAR(corner & 255, 100, 2);
   // the middle of the left edge
   const double r = std::sqrt(std::pow(50 / 50.5, 2) / 2), s = (r - 0.4) / 0.6;

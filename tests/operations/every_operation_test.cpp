@@ -11,7 +11,7 @@ namespace {
 
 const EngineOptions kSerial;
 
-// Pictures of all kinds: every depth, one pixel, one row, one column, with alpha.
+// All kinds of pictures: every depth, one pixel, one row, one column, with alpha.
 PicturePointer TestPicture(int32_t width, int32_t height, int32_t bits, bool alpha) {
   PicturePointer picture = MakePicture(
       width, height, [](int32_t x, int32_t y) { return Scatter(x / 3, y / 2) & 0xffffff; });
@@ -32,7 +32,7 @@ PicturePointer TestPicture(int32_t width, int32_t height, int32_t bits, bool alp
   return picture;
 }
 
-// What a picture looks like, whatever its depth.
+// The visible pixels of a picture, independent of its depth.
 std::vector<uint8_t> Looks(const PictureRecord& picture) {
   std::vector<uint8_t> bytes;
   BgrRows rows;
@@ -63,8 +63,8 @@ void ExpectWhole(const PictureRecord& picture) {
   EXPECT_EQ(picture.alpha.Height(), picture.image.Height());
 }
 
-// A line with each number at its least or most, and everything else at its default; empty where
-// that is a mistake.
+// A line with each number at its minimum or maximum, and everything else at its default; empty if
+// that is invalid.
 std::string LineAt(const Operation& operation, bool most) {
   std::string line = operation.name;
   for (const Parameter& row : operation.parameters) {
@@ -104,7 +104,7 @@ TEST(EveryOperation, WorksOnEveryKindOfPicture) {
          {std::string(operation->example), LineAt(*operation, false), LineAt(*operation, true)}) {
       SCOPED_TRACE(line);
       Recipe recipe;
-      if (!ReadRecipe(line, {}, recipe).empty()) continue;  // a parameter must be given
+      if (!ReadRecipe(line, {}, recipe).empty()) continue;  // it has a required parameter
       PictureRecord none;
       EXPECT_EQ(ApplySteps(none, recipe.common, kSerial), Status::EmptyImage);
       for (const int32_t bits : {1, 4, 8, 24}) {

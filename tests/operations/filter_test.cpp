@@ -27,7 +27,7 @@ PicturePointer Source() {
                      [](int32_t x, int32_t y) { return Scatter(x / 3, y / 2) & 0xffffff; });
 }
 
-// A channel of a picture whose edges repeat.
+// A channel of a picture with repeated edges.
 struct Channel {
   const PictureRecord& picture;
   int shift;
@@ -74,7 +74,7 @@ TEST(Filters, ComputeTheirFormulas) {
          return 5.0 * at(x, y) - at(x - 1, y) - at(x + 1, y) - at(x, y - 1) - at(x, y + 1);
        },
        0},
-      {"kernel '0 0 0 0 0 0 0 0 0 0 0 0 0 0 2.5 0 0 0 0 0 0 0 0 0 0' divisor=2 bias=-20",  // two to the right
+      {"kernel '0 0 0 0 0 0 0 0 0 0 0 0 0 0 2.5 0 0 0 0 0 0 0 0 0 0' divisor=2 bias=-20",  // two pixels to the right
        [](const Channel& at, int32_t x, int32_t y) { return at(x + 2, y) * 1.25 - 20; }, 0},
       {"kernel '1 0 -1 1 0 -1 1 0 -1' bias=100",  // a sum of 0 divides by 1; not mirrored
        [](const Channel& at, int32_t x, int32_t y) {
@@ -234,7 +234,7 @@ TEST(Filters, OfAFaceOnlyPupilsLoseTheirRed) {
   }
 }
 
-// The hidden colors of transparent pixels must not come out.
+// The colors of transparent pixels must not bleed.
 TEST(Filters, ColorsCountByTheirAlpha) {
   for (const char* line : {"motion-blur 5 20", "radial-blur zoom 60", "radial-blur spin 40",
                            "surface-blur 3 255", "oil 2", "mosaic 7", "kernel '1 1 1 1 1 1 1 1 1'",

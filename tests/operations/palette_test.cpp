@@ -58,7 +58,7 @@ TEST(Reduce, GivesTheDepthOfItsColorsWithEveryDither) {
   }
 }
 
-// Dithering keeps the mean of an area wherever the palette reaches black and white. Atkinson drops
+// Dithering preserves the mean of an area if the palette includes black and white. Atkinson drops
 // errors, so it does not.
 TEST(Reduce, DithersKeepTheMean) {
   for (const char* reduce : {"mono", "reduce 2 fixed", "reduce 4 gray"}) {
@@ -78,11 +78,11 @@ TEST(Reduce, DithersKeepTheMean) {
   }
 }
 
-// By hand: the error of the first pixel, 100, goes to its neighbors as each kernel says.
+// Computed by hand: the error of the first pixel, 100, is diffused according to each kernel.
 TEST(Reduce, DiffusesErrorsByTheirKernels) {
   const struct {
     const char* dither;
-    // of the pixel behind a gray of 100: white with the error it gets, black just below
+    // of the pixel after a gray of 100: white with the diffused error, black just below
     int32_t level;
   } rows[] = {{"floyd-steinberg", 128 - 44},
               {"atkinson", 128 - 13},
@@ -136,7 +136,7 @@ TEST(ColorTable, ReadsEveryKindAndRefusesTheRest) {
   const struct {
     const char* name;
     std::string contents;
-    int32_t count;  // 0: refused
+    int32_t count;  // 0: rejected
   } rows[] = {
       {"ccl", "# two colors\n1 41 81\n\n 121\t161 201 # the second\r\n", 2},
       {"ccl without a line end", "1 41 81\n121 161 201", 2},

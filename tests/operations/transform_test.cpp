@@ -23,7 +23,7 @@ Status Apply(PictureRecord& picture, const std::string& text) {
   return ApplySteps(picture, recipe.common, kSerial);
 }
 
-// A picture of 5 x 3 pixels of any depth that uses `used` colors of its palette.
+// A picture of 5 x 3 pixels at any depth that uses `used` colors of its palette.
 PicturePointer SmallPicture(int32_t bits, int32_t used) {
   PicturePointer picture = MakePicture(5, 3, [](int32_t x, int32_t y) {
     return static_cast<uint32_t>(0x203040 + 0x0a0000 * x + 0x11 * y);
@@ -125,8 +125,7 @@ TEST(Transforms, TrimCutsTheBorderOff) {
   }
 }
 
-// What interpolation is by definition: pixels weighed by a kernel, colors by their alpha too; the
-// backdrop beyond the edges.
+// Reference interpolation: pixels weighted by a kernel, colors by alpha, too; the backdrop outside.
 struct Sampler {
   const PictureRecord& picture;
   double (*kernel)(double);
@@ -164,7 +163,7 @@ double Cubic(double x) {
 double Tent(double x) { return std::max(0.0, 1 - std::abs(x)); }
 
 struct Spot {
-  double x, y;  // from the middle of the picture, as results and sources are
+  double x, y;  // relative to the center, in result and source
 };
 constexpr double kDegree = std::numbers::pi / 180;
 Spot Turned(Spot spot, double degrees) {
@@ -301,7 +300,7 @@ TEST(Transforms, RefuseWhatMakesNoPicture) {
     const char* line;
     Status status;
   } rows[] = {
-      {"perspective 0,0 0,10 10,10 10,0", Status::EmptyImage},  // inside out
+      {"perspective 0,0 0,10 10,10 10,0", Status::EmptyImage},  // mirrored
       {"perspective 5,5 5,5 5,5 5,5", Status::EmptyImage},
       {"perspective size=1000000x1000000", Status::MemoryAllocationError},
       {"canvas 1000000x1000000", Status::MemoryAllocationError},

@@ -19,7 +19,7 @@ namespace fs = std::filesystem;
 using test::TemporaryFolder;
 using test::WriteBytes;
 
-// Bytes that tell their place; none is 0.
+// Nonzero bytes that depend on their offset.
 std::vector<uint8_t> Pattern(size_t size) {
   std::vector<uint8_t> bytes(size);
   for (size_t i = 0; i < size; ++i) bytes[i] = static_cast<uint8_t>(1 + (i * 7 + i / 251) % 255);
@@ -49,7 +49,7 @@ TEST(FileView, ShowsTheWholeFileOrItsHead) {
       EXPECT_TRUE(Equal(view.Bytes(), std::span(bytes).first(seen)));
       EXPECT_EQ(view.FileSize(), size);
       std::vector<uint8_t> rest(size - seen);
-      EXPECT_TRUE(view.ReadAt(seen, rest));  // the file behind the head
+      EXPECT_TRUE(view.ReadAt(seen, rest));  // the file after the head
       EXPECT_TRUE(Equal(rest, std::span(bytes).subspan(seen)));
       uint8_t one[1];
       for (const uint64_t past : {uint64_t{size}, UINT64_MAX})
@@ -60,7 +60,7 @@ TEST(FileView, ShowsTheWholeFileOrItsHead) {
     EXPECT_TRUE(Equal(moved.Bytes(), bytes));
     moved.DropBefore(size / 2);
     moved.DropBefore(UINT64_MAX);
-    EXPECT_TRUE(Equal(moved.Bytes(), bytes));  // fetched again
+    EXPECT_TRUE(Equal(moved.Bytes(), bytes));  // read again
     EXPECT_TRUE(moved.Intact());
   }
 }
@@ -102,9 +102,9 @@ TEST(FileView, AFileCutShortReadsAsZerosAndIsNotIntact) {
     EXPECT_FALSE(view.Intact());
     std::vector<uint8_t> copy(kSize);
     EXPECT_FALSE(view.ReadAt(0, copy));
-    EXPECT_TRUE(before.Intact() && after.Intact());  // views beside it are untouched
+    EXPECT_TRUE(before.Intact() && after.Intact());  // other views are not affected
     EXPECT_TRUE(Equal(before.Bytes(), bytes) && Equal(after.Bytes(), bytes));
-    ASSERT_TRUE(view.Open(other));  // a slot starts anew
+    ASSERT_TRUE(view.Open(other));  // a slot is reset
     EXPECT_TRUE(view.Intact() && Equal(view.Bytes(), bytes));
   }
 }
@@ -120,7 +120,7 @@ TEST(FileView, OtherBusErrorsStillEndTheProgram) {
     kill(getpid(), SIGBUS);
     _exit(92);
   });
-  EXPECT_FALSE(WIFEXITED(status) && WEXITSTATUS(status) > 90) << status;  // by the signal, or by what a sanitizer makes of it
+  EXPECT_FALSE(WIFEXITED(status) && WEXITSTATUS(status) > 90) << status;  // signal or sanitizer
 }
 
 TEST(FileView, MoreViewsThanTheTableHolds) {

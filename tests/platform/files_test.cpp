@@ -53,7 +53,7 @@ TEST(Paths, SplitIntoPartsThatJoinToThePathAgain) {
   EXPECT_EQ(JoinFolder("/", "n"), "/n");
 }
 
-// A folder with one of everything.
+// A folder with one entry of each kind.
 class FilesTest : public testing::Test {
  protected:
   FilesTest() {
@@ -113,7 +113,7 @@ TEST_F(FilesTest, FactsTellSizeTimesAndIdentity) {
   const FileFacts facts = FactsOf(Path("to regular"));
   EXPECT_EQ(facts.size, 5u);
   EXPECT_EQ(facts.modified, 1'000'000'000);
-  EXPECT_GE(facts.created, 1'000'000'000);  // birth time, or the modification time where none is kept
+  EXPECT_GE(facts.created, 1'000'000'000);  // birth time, or modification time if there is none
   EXPECT_EQ(facts.identity, FactsOf(Path("regular")).identity);
   EXPECT_NE(facts.identity, FactsOf(Path("folder")).identity);
 }
@@ -211,7 +211,7 @@ TEST(Files, OneWinsARaceForAName) {
     const int winner =
         static_cast<int>(std::find(results, results + kRunners, CommitResult::Done) - results);
     EXPECT_EQ(ReadText(folder.Path("name")), std::to_string(winner));
-    EXPECT_EQ(folder.Names().size(), static_cast<size_t>(kRunners));  // the losers keep theirs
+    EXPECT_EQ(folder.Names().size(), static_cast<size_t>(kRunners));  // the others keep their files
     ASSERT_TRUE(DeleteFile(folder.Path("name")));
   }
   refusingRename = RefusingRename::Directly;
@@ -254,7 +254,7 @@ TEST_F(FilesTest, ReadsWholeSmallFiles) {
     EXPECT_EQ(contents, row.result == ReadResult::Done ? "12345" : "");
   }
   std::string contents;
-  EXPECT_EQ(ReadWholeFile("/proc/self/status", 1 << 20, contents), ReadResult::Done);  // tells no size
+  EXPECT_EQ(ReadWholeFile("/proc/self/status", 1 << 20, contents), ReadResult::Done);  // reports no size
   EXPECT_TRUE(contents.starts_with("Name:"));
   EXPECT_EQ(ReadWholeFile("/proc/self/status", 20, contents), ReadResult::TooLarge);
 }

@@ -41,7 +41,7 @@ CommitResult WriteAs(const std::string& path, std::string_view text) {
   return file.Commit(Existing::Replace);
 }
 
-// Becomes the superuser's servant for a scope: root may do everything.
+// Drops root privileges within a scope, since root may do everything.
 class OrdinaryUser {
  public:
   OrdinaryUser() : stepped_(geteuid() == 0 && setegid(65534) == 0 && seteuid(65534) == 0) {}
@@ -67,7 +67,7 @@ class HeldFileTest : public testing::TestWithParam<ReplaceWay> {
 };
 INSTANTIATE_TEST_SUITE_P(Ways, HeldFileTest, testing::Values(ReplaceWay::Exchange, ReplaceWay::Link, ReplaceWay::Look));
 
-// What another program does to the file, and what is there afterwards.
+// How another program changes the file, and the result.
 void WriteInPlace(const std::string& path) { WriteText(path, "theirs, in place"); }
 void SaveBeside(const std::string& path) {
   WriteText(path + ".new", "theirs");
@@ -80,7 +80,7 @@ TEST_P(HeldFileTest, WhatOthersWriteMeanwhileStays) {
     const char* name;
     void (*change)(const std::string& path);
     const char* left;
-    bool seenAfterwards;  // also by a way that looks at what came out
+    bool seenAfterwards;  // even when only checked afterwards
   } rows[] = {{"in place", WriteInPlace, "theirs, in place", true},
               {"saved beside", SaveBeside, "theirs", GetParam() == ReplaceWay::Exchange},
               {"same length, in place", [](const std::string& path) { WriteText(path, "OLD"); }, "OLD", true}};
@@ -118,7 +118,7 @@ TEST_P(HeldFileTest, WhatOthersWriteMeanwhileStays) {
   EXPECT_THAT(folder_.Names(), ElementsAre("file"));
 }
 
-// Each adds its letter to what it finds; without the lock, letters are lost.
+// Each appends its letter to the contents; without the lock, letters would be lost.
 TEST_P(HeldFileTest, RunsKeepApart) {
   constexpr int kRuns = 8, kTimes = 20;
   WriteText(Path(), "");
@@ -178,7 +178,7 @@ TEST(ReplacedFile, KeepsWhatBelongsToTheFile) {
   if (!root) return;
   EXPECT_EQ(facts.st_uid, 1234u);
   EXPECT_EQ(facts.st_gid, 4321u);
-  // An ordinary user cannot give it to its owner, and says so.
+  // An ordinary user cannot set the owner, and reports that.
   ASSERT_EQ(removexattr(path.c_str(), "system.posix_acl_access") == 0 || !hasList, true);
   ASSERT_EQ(chmod(path.c_str(), 0666), 0);
   ASSERT_EQ(chmod(folder.Path().c_str(), 0777), 0);

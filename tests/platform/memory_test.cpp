@@ -32,7 +32,7 @@ TEST(MemoryBlock, StartsAsZerosHoweverOftenItWasUsed) {
       EXPECT_TRUE(AllAre(block.Bytes(), 0));
       std::memset(other.Data(), 0xAA, size);
       std::memset(block.Data(), 0xFF, size);
-      EXPECT_TRUE(AllAre(other.Bytes(), 0xAA));  // two owners never share
+      EXPECT_TRUE(AllAre(other.Bytes(), 0xAA));  // owners never share memory
     }
   }
 }
@@ -51,7 +51,7 @@ TEST(MemoryBlock, ResizeKeepsTheContentsAndAddsZeros) {
       EXPECT_TRUE(AllAre(block.Bytes().subspan(kept), 0));
     }
   }
-  MemoryBlock block;  // shrinking leaves bytes that growing must not show again
+  MemoryBlock block;  // bytes removed by shrinking must not reappear
   ASSERT_TRUE(block.Allocate(8 * kMega));
   std::memset(block.Data(), 7, block.Size());
   ASSERT_TRUE(block.Resize(5 * kMega) && block.Resize(8 * kMega));

@@ -29,7 +29,7 @@ std::span<const uint8_t> BytesOf(std::string_view text) {
   return {reinterpret_cast<const uint8_t*>(text.data()), text.size()};
 }
 
-// Every case runs on each way that a system may have of making a file appear.
+// Every case runs with each method of creating a file.
 class OutputFileTest : public testing::TestWithParam<UnnamedFiles> {
  protected:
   OutputFileTest() { unnamedFiles = GetParam(); }
@@ -82,14 +82,14 @@ TEST_P(OutputFileTest, WhatMayNotBecomeAFileStays) {
     EXPECT_FALSE(file.Write(BytesOf("x"))) << name;
     EXPECT_EQ(file.Commit(Existing::Replace), CommitResult::Failed) << name;
   }
-  OutputFile late;  // the name is taken by something else before the commit
+  OutputFile late;  // the name is taken before the commit
   ASSERT_TRUE(late.Create(Path("late")));
   ASSERT_EQ(mkfifo(Path("late").c_str(), 0600), 0);
   EXPECT_EQ(late.Commit(Existing::Replace), CommitResult::Failed);
   EXPECT_THAT(folder_.Names(), ElementsAre("fifo", "folder", "late", "regular"));
   ASSERT_EQ(chmod(Path("regular").c_str(), 0444), 0);
   ASSERT_EQ(chmod(folder_.Path().c_str(), 0777), 0);
-  // the superuser may write to everything
+  // root may write to everything
   const bool stepsDown = geteuid() == 0 && seteuid(65534) == 0;
   EXPECT_EQ(WriteAs(Path("regular"), "new", Existing::Replace), CommitResult::Failed);
   if (stepsDown) {
@@ -164,7 +164,7 @@ TEST_P(OutputFileTest, AFullDiskLeavesTheOldFile) {
     OutputFile file;
     const std::string text(70'000, 'n');
     if (!file.Create(Path("file")) || !file.Write(BytesOf(text))) _exit(1);
-    if (file.Write(BytesOf(text)) || file.Write(BytesOf("x"))) _exit(2);  // a failure is remembered
+    if (file.Write(BytesOf(text)) || file.Write(BytesOf("x"))) _exit(2);  // write errors are sticky
     if (file.Commit(Existing::Replace) != CommitResult::Failed) _exit(3);
   });
   EXPECT_EQ(status, 0);
@@ -174,7 +174,7 @@ TEST_P(OutputFileTest, AFullDiskLeavesTheOldFile) {
 
 TEST_P(OutputFileTest, AnEndedProgramLeavesNothing) {
   for (const int number : {SIGKILL, SIGTERM}) {
-    // only a name can be left behind
+    // only a named file can be left behind
     if (number == SIGKILL && GetParam() == UnnamedFiles::DoNotWork) continue;
     const int status = test::InChild([&] {
       OutputFile file;

@@ -42,7 +42,7 @@ TEST(Clock, TellsTheWallClock) {
   EXPECT_EQ(LocalTimeOf(INT64_MAX).month, 0);
 }
 
-// A program file that writes its arguments, one a line, into `out`.
+// A program that writes its arguments to `out`, one per line.
 std::string ArgumentPrinter(const TemporaryFolder& folder, const std::string& out) {
   const std::string path = folder.Path("printer");
   WriteText(path, "#!/bin/sh\nprintf '%s\\n' \"$@\" >'" + out + ".part'\nmv '" + out + ".part' '" +

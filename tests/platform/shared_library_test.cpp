@@ -14,7 +14,7 @@ namespace {
 namespace fs = std::filesystem;
 using test::TemporaryFolder;
 
-// The file of a library that this program has loaded.
+// The path of a library that this process has loaded.
 std::string LoadedFile(std::string_view name) {
   std::istringstream maps(test::ReadText("/proc/self/maps"));
   for (std::string line; std::getline(maps, line);) {

@@ -94,7 +94,7 @@ TEST(StoreFile, KnowsWhenItsNameWentToAnother) {
   EXPECT_FALSE(file.IsStill(path));
 }
 
-// Adds one to the digit string in a store, `rounds` times, each under the lock.
+// Increments the decimal number in a store `rounds` times, each time under the lock.
 void Count(const std::string& path, int rounds) {
   StoreFile file;
   if (file.Open(path, Mode::ReadWrite) != OpenResult::Done) return;
@@ -142,7 +142,7 @@ TEST(StoreFile, TheLockDiesWithItsProcessAndHearsTheUser) {
     if (own.Open(path, Mode::ReadWrite) != OpenResult::Done) _exit(1);
     CatchTermination();
     raise(SIGTERM);
-    _exit(own.Lock() ? 2 : 3);  // the parent holds it: gives up instead of waiting for ever
+    _exit(own.Lock() ? 2 : 3);  // the parent holds it: fails instead of waiting forever
   });
   EXPECT_EQ(WEXITSTATUS(status), 3);
 }

@@ -28,8 +28,7 @@ std::vector<std::string> NamesIn(const std::string& folder) {
   return names;
 }
 
-// The user's data folder is a fresh one on the device of the files that go, so that their trash is
-// data/Trash.
+// The user's data folder is a fresh one on the files' device, so that their trash is data/Trash.
 class TrashTest : public testing::Test {
  protected:
   TrashTest() : data_("XDG_DATA_HOME", folder_.Path("data")), zone_("TZ", "XYZ-2") {
@@ -68,7 +67,7 @@ TEST_F(TrashTest, KeepsWhatHasTheSameName) {
   }
   EXPECT_THAT(NamesIn(Trash("files")), ElementsAre("a.b.2.bmp", "a.b.3.bmp", "a.b.bmp"));
   EXPECT_EQ(ReadText(Trash("files/a.b.2.bmp")), "2");
-  WriteText(Trash("files/left"), "without info");  // a name may be taken in either folder
+  WriteText(Trash("files/left"), "without info");  // a name may exist in either folder
   WriteText(Picture("left"), "new");
   ASSERT_TRUE(MoveToTrash(Picture("left")));
   EXPECT_EQ(ReadText(Trash("files/left")), "without info");
@@ -136,8 +135,7 @@ TEST_F(TrashTest, LeavesNothingBehindWhenItCannot) {
   EXPECT_EQ(ReadText(Picture("b")), "1");
 }
 
-// Mounts a small volume of its own at `folder`, seen by this process alone. False where that is not
-// allowed.
+// Mounts a small volume at `folder`, visible to this process only. False if that is not permitted.
 bool MountVolume(const std::string& folder) {
   const std::string user = std::to_string(getuid()), group = std::to_string(getgid());
   if (unshare(CLONE_NEWNS) != 0) {
@@ -179,14 +177,14 @@ TEST_F(TrashTest, AnotherVolumeHasItsOwn) {
     fs::remove_all(Picture(".Trash"));
     fs::create_directory(Picture("elsewhere"));
     fs::permissions(Picture("elsewhere"), fs::perms::sticky_bit, fs::perm_options::add);
-    fs::create_symlink("elsewhere", Picture(".Trash"));  // a link is not trusted
+    fs::create_symlink("elsewhere", Picture(".Trash"));  // links are not trusted
     check(gone("c", own));
     fs::rename(Picture(own), Picture("moved"));
     fs::create_symlink("moved", Picture(own));
     WriteText(Picture("d"), "d");
     check(!HasTrash(Picture("d")) && !MoveToTrash(Picture("d")) && ReadText(Picture("d")) == "d");
     check(!MoveToTrash(Picture("")));  // the volume's own top folder
-    // What others made is not trusted with files of ours; only the superuser can try.
+    // Folders created by others are not trusted with our files; only root can test this.
     for (const char* foreign : {"", "/files", "/info"}) {
       fs::remove_all(Picture(own));
       fs::create_directories(Picture(own + "/files"));

@@ -27,7 +27,7 @@ constexpr std::string_view mountTable =
     "45x 22 8:1 / /number rw - ext4 /dev/sda1 rw\n"
     "46 22 8:1 /\n\n";
 
-// A tree as the kernel and udev keep it, with the devices of the table above.
+// A tree as created by the kernel and udev, with the devices of the table above.
 class MountTest : public testing::Test {
  protected:
   MountTest() {
@@ -75,7 +75,7 @@ TEST_F(MountTest, EveryMountIsDescribed) {
   const struct {
     uint64_t id;
     const char *source, *label;
-    uint32_t serial;  // 0: what it is does not matter, as long as it is not the stand-in
+    uint32_t serial;  // 0: any value except the fallback
     DriveKind kind;
   } rows[] = {
       {22, "/dev/sda2", "", 0, DriveKind::Fixed},       {36, "/dev/sdb1", "MY STICK/\xC3\xA9", 0x1A2B3C4D, DriveKind::Removable},

@@ -14,7 +14,7 @@
 #include "support/faults.h"
 #include "support/files.h"
 
-// The tasks are those of the test programs' main function.
+// The tasks are registered in the test programs' main function.
 namespace fotomill::platform {
 namespace {
 
@@ -22,7 +22,7 @@ std::span<const uint8_t> Bytes(std::string_view text) {
   return {reinterpret_cast<const uint8_t*>(text.data()), text.size()};
 }
 
-// Whether this process has children, running or not yet waited for.
+// Whether this process has children, running or not yet reaped.
 bool HasChildren() { return waitpid(-1, nullptr, WNOHANG) >= 0 || errno != ECHILD; }
 
 TEST(WorkApart, GivesBackWhatItSharesAndStaysForTheNext) {

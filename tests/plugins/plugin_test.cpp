@@ -158,7 +158,7 @@ TEST_F(Plugins, AWriterGetsTheDestinationsName) {
   test::WriteText(folder_.Path("x.odd"), "");
   PicturePointer picture;
   ASSERT_EQ(LoadPicture({.fileName = folder_.Path("x.odd")}, picture), Status::Ok);
-  // the working folder has a longer path than the destination's
+  // the temporary folder's path is longer than the destination's
   const std::string longest = std::string(255 - folder_.Path("x").size(), 'n') + ".odd";
   for (const std::string& name : {std::string("holiday in May.odd"), longest}) {
     ASSERT_EQ(WritePicture(*picture, folder_.Path(name), {}), Status::Ok);

@@ -25,7 +25,7 @@ TEST(Bands, CoverEveryRowOnce) {
   }
 }
 
-// One that is stopped halfway through a picture does not do the rest of it.
+// If stopped halfway through a picture, it skips the rest.
 TEST(Bands, StopWithinAPicture) {
   int32_t done = 0;
   const Work work{.threads = 1, .goesOn = [&] { return done < 500; }};

@@ -22,7 +22,7 @@ std::vector<uint8_t> Saved(cmsHPROFILE profile) {
   return bytes;
 }
 
-// The primaries of Adobe RGB (1998), whose green is far outside of sRGB.
+// The primaries of Adobe RGB (1998), whose green is far outside sRGB.
 std::vector<uint8_t> WideProfile() {
   const cmsCIExyYTRIPLE primaries = {{0.64, 0.33, 1}, {0.21, 0.71, 1}, {0.15, 0.06, 1}};
   cmsToneCurve* const gamma = cmsBuildGamma(nullptr, 563.0 / 256);
@@ -44,7 +44,8 @@ double Encoded(double light) {
   return 255 * (light <= 0.0031308 ? 12.92 * light : 1.055 * std::pow(light, 1 / 2.4) - 0.055);
 }
 
-// A wide color, 0x00RRGGBB, in sRGB: by the two standards' matrices, not by the library.
+// A wide-gamut color, 0x00RRGGBB, in sRGB: by the two standards' matrices, independent
+// of the library.
 std::array<double, 3> WideInSrgb(uint32_t color) {
   const double r = std::pow((color >> 16) / 255.0, 563.0 / 256),
                g = std::pow((color >> 8 & 255) / 255.0, 563.0 / 256),
@@ -81,20 +82,19 @@ TEST(ColorTransform, BringsWideColorsToTheScreen) {
     for (int c = 0; c < 3; ++c)
       ASSERT_NEAR(after[i] >> (16 - 8 * c) & 255, wanted[static_cast<size_t>(c)], 1.6) << std::hex << before[i];
   }
-  // The table of a small palette comes out as the same pixels do.
+  // The table of a palette image is converted like pixels.
   PackedImage small;
   ASSERT_EQ(NewPackedImage(1, 1, nullptr, 4, small), Status::Ok);
   small.ColorTable()[1] = 200;
   ASSERT_EQ(transform.Apply(small), Status::Ok);
   EXPECT_NEAR(small.ColorTable()[1], WideInSrgb(0x00c800)[1], 1);
-  // On a screen of the same colors nothing is to be done; on it, pictures without a profile are
-  // those of sRGB.
+  // If the screen has the same profile, nothing changes; pictures without a profile are sRGB.
   EXPECT_FALSE(ColorTransform(WideProfile(), WideProfile()).ChangesColors());
   PackedImage green;
   ASSERT_EQ(NewPackedImage(1, 1, nullptr, 24, green), Status::Ok);
   green.Row(0)[1] = 255;
   ASSERT_EQ(ColorTransform({}, WideProfile()).Apply(green), Status::Ok);
-  EXPECT_NEAR(green.Row(0)[2], 144, 1);  // the red of sRGB's green in Adobe RGB
+  EXPECT_NEAR(green.Row(0)[2], 144, 1);  // sRGB green has this much red in Adobe RGB
 }
 
 TEST(ColorTransform, GrayProfilesAreForGrayPictures) {
@@ -111,7 +111,7 @@ TEST(ColorTransform, GrayProfilesAreForGrayPictures) {
   EXPECT_EQ(colored->image.PixelAt(0, 0), 0x404040);
 }
 
-// The offset of a tag's entry in the table of tags.
+// The offset of a tag's entry in the tag table.
 size_t EntryOf(const std::vector<uint8_t>& profile, const char* name) {
   for (size_t at = 132; at + 12 <= profile.size(); at += 12) {
     if (std::memcmp(&profile[at], name, 4) == 0) return at;
@@ -125,7 +125,7 @@ void Put32(std::vector<uint8_t>& bytes, size_t at, size_t value) {
     bytes[at + static_cast<size_t>(i)] = static_cast<uint8_t>(value >> (24 - 8 * i));
 }
 
-// The copyright gives way to a chain of a hundred thousand steps, which all are the same matrix.
+// Replaces the copyright tag by a chain of 100,000 steps that all share one matrix.
 std::vector<uint8_t> WithEndlessSteps(std::vector<uint8_t> profile) {
   constexpr size_t kSteps = 100'000, kMatrix = 16 + 8 * kSteps, kMatrixSize = 12 + 12 * 4;
   const size_t entry = EntryOf(profile, "cprt"), start = (profile.size() + 3) / 4 * 4;
@@ -151,7 +151,7 @@ TEST(ColorTransform, HostileProfilesDoNoHarm) {
   EXPECT_FALSE(ColorTransform(Saved(cmsCreateLab4Profile(nullptr))).ChangesColors());
   EXPECT_FALSE(ColorTransform(Saved(cmsCreateInkLimitingDeviceLink(cmsSigCmykData, 300))).ChangesColors());
   const std::vector<uint8_t> wide = WideProfile();
-  EXPECT_TRUE(ColorTransform(WithEndlessSteps(wide)).ChangesColors());  // by its other tags, and soon
+  EXPECT_TRUE(ColorTransform(WithEndlessSteps(wide)).ChangesColors());  // fast, by its other tags
   const auto picture =
       test::MakePicture(4, 4, [](int32_t x, int32_t y) { return test::Scatter(x, y) & 0xffffff; });
   for (size_t cut = 0; cut < wide.size(); cut += 7)

@@ -57,7 +57,7 @@ TEST(Flatten, PalettePicturesAreBlendedToo) {
   struct Row {
     const char* name;
     uint32_t colors;
-    int32_t lowest, bits;  // the least alpha; the depth afterwards
+    int32_t lowest, bits;  // minimum alpha; resulting depth
   };
   const Row rows[] = {
       {"opaque stays as it is", 2, 255, 1},

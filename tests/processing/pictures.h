@@ -56,7 +56,7 @@ inline std::vector<uint32_t> Colors(const PictureRecord& picture) {
   return colors;
 }
 
-// A number that looks random but is the same in every run.
+// A pseudorandom number that is the same in every run.
 inline uint32_t Scatter(int32_t x, int32_t y) {
   uint32_t value = static_cast<uint32_t>(x) * 0x9e3779b1u ^ static_cast<uint32_t>(y) * 0x85ebca77u;
   value = (value ^ value >> 15) * 0x2c1b3c6du;

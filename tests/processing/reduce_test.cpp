@@ -37,7 +37,7 @@ TEST(Reduce, DepthFollowsTheAim) {
       EXPECT_EQ(picture->image.Bits(), row.bits);
       EXPECT_EQ(picture->bitsPerPixel, row.bits);
       EXPECT_EQ(picture->image.Width(), 61);
-      // The image's own table and the record's palette say the same.
+      // The image's table and the record's palette agree.
       for (int32_t i = 0; i < picture->image.Colors(); ++i) {
         for (int32_t c = 0; c < 3; ++c) {
           EXPECT_EQ(picture->image.ColorTable()[static_cast<size_t>(4 * i + 2 - c)],
@@ -63,14 +63,13 @@ TEST(Reduce, FewColorsAreKeptExactly) {
   }
 }
 
-// Dithering must keep the mean of any area, at every level of gray and in both directions of
-// travel.
+// Dithering must preserve the mean of any area, at every gray level and in both scan directions.
 TEST(Reduce, DitheredGraysKeepTheirMean) {
   for (const Dither dither : {Dither::Ordered, Dither::FloydSteinberg}) {
     for (const bool serpentine : {false, true}) {
       for (int32_t level = 0; level <= 255; level += 5) {
         SCOPED_TRACE(testing::Message() << level << ", dither " << static_cast<int32_t>(dither));
-        // Two pixels of other colors keep the picture from being packed exactly.
+        // Two pixels of other colors prevent exact packing.
         const PicturePointer picture = MakePicture(128, 128, [level](int32_t x, int32_t y) {
           return y == 0 && x < 2 ? Gray(100 + x) : Gray(level);
         });
@@ -122,7 +121,7 @@ TEST(Reduce, AlphaGoesToTheBackgroundFirst) {
   EXPECT_EQ(Colors(*picture), std::vector<uint32_t>(400, 0x302010));
 }
 
-// Peak signal to noise in dB.
+// Peak signal-to-noise ratio in dB.
 double Likeness(const std::vector<uint32_t>& a, const std::vector<uint32_t>& b) {
   double error = 0;
   for (size_t i = 0; i < a.size(); ++i) {
@@ -133,14 +132,14 @@ double Likeness(const std::vector<uint32_t>& a, const std::vector<uint32_t>& b) 
   return 10 * std::log10(255.0 * 255.0 * 3 * static_cast<double>(a.size()) / error);
 }
 
-// Limits a little below what was reached when they were set: the palette's quality must not slip
-// unnoticed.
+// Slightly below the values measured when they were set: the palette quality must
+// not silently degrade.
 TEST(Reduce, PalettesStayTrueToThePicture) {
   const auto waves = [](int32_t x, int32_t y) {
     const auto level = [](double t) { return static_cast<uint32_t>(127.5 + 120 * std::sin(t)); };
     return level(x / 40.0) << 16 | level(y / 30.0 + 1) << 8 | level((x + y) / 70.0);
   };
-  // Two clusters of like colors, far apart.
+  // Two distant clusters of similar colors.
   const auto clusters = [](int32_t x, int32_t y) {
     const uint32_t noise = test::Scatter(x, y);
     return (x < 100 ? 0x181410u : 0xd8d0e0u) +
@@ -177,7 +176,7 @@ TEST(Reduce, PalettesStayTrueToThePicture) {
 TEST(Reduce, NearestColorIsNearest) {
   std::mt19937 random(11);
   for (const int32_t count : {1, 2, 16, 255, 256}) {
-    for (const int32_t range : {256, 40, 3}) {  // the narrower, the more colors share a cell
+    for (const int32_t range : {256, 40, 3}) {  // the narrower, the more colors per cell
       SCOPED_TRACE(testing::Message() << count << " colors within " << range);
       Palette palette{};
       for (uint8_t& level : palette)

@@ -66,8 +66,8 @@ TEST(Scale, KeysSelectTheFilterThatTheirListNames) {
   EXPECT_EQ(ScaleFilterFromKey(INT32_MAX), ScaleFilter::Nearest);
 }
 
-// The value of every pixel by the filter's definition, in floating point, pixel by pixel in both
-// directions at once.
+// Reference values: the filter's definition in floating point, pixel by pixel, in both directions
+// at once.
 struct Reference {
   ScaleFilter filter;
   double Shape(double x) const {
@@ -94,8 +94,7 @@ struct Reference {
     for (double& w : weights) w /= sum;
     return weights;
   }
-  // Blue, green, red and alpha of every pixel of the result, row by row; colors already divided by
-  // the alpha.
+  // Blue, green, red and alpha of every pixel of the result, row by row, not premultiplied.
   std::vector<std::array<double, 4>> Scale(const PictureRecord& picture, Size size) const {
     const int32_t width = picture.image.Width(), height = picture.image.Height();
     std::vector<std::array<double, 4>> narrow(static_cast<size_t>(size.width * height)),
@@ -216,7 +215,7 @@ TEST(Scale, MirrorsStayMirrors) {
     for (const ScaleFilter filter : kFilters) {
       for (const Orientation mirror : {Orientation::MirrorAcross, Orientation::MirrorDown}) {
         SCOPED_TRACE(testing::Message() << width << " to " << size.width << ", filter " << static_cast<int32_t>(filter));
-        // An even picture has no middle pixel that Nearest must break a tie for.
+        // With an odd width there is no tie at the middle pixel for Nearest.
         const PicturePointer picture = MakePicture(width, 21, [&](int32_t x, int32_t y) {
           return Scatter(std::min(x, width - 1 - x), std::min(y, 20 - y)) & 0xffffff;
         });
@@ -227,7 +226,7 @@ TEST(Scale, MirrorsStayMirrors) {
         for (size_t i = 0; i < before.size(); ++i) {
           const auto x = static_cast<int32_t>(i) % size.width,
                      y = static_cast<int32_t>(i) / size.width;
-          // may round its own way
+          // ties may be rounded differently
           if (2 * x + 1 == size.width || 2 * y + 1 == size.height) continue;
           if (filter == ScaleFilter::Nearest && width % 2 == 0) continue;
           ASSERT_EQ(before[i], after[i]) << x << ", " << y;
@@ -237,8 +236,7 @@ TEST(Scale, MirrorsStayMirrors) {
   }
 }
 
-// A slope must come out as the same slope: half a pixel's shift would show as a constant
-// difference.
+// A slope must be preserved: a shift by half a pixel would be a constant difference.
 TEST(Scale, NothingMovesAside) {
   for (const int32_t width : {32, 100, 255, 700}) {
     for (const ScaleFilter filter : kFilters) {
@@ -284,7 +282,7 @@ TEST(Scale, TransparentColorsLeaveNoFringe) {
   }
 }
 
-// Averaging blocks first must not show: against the whole filter, over 45 dB.
+// Block averaging must not be visible: over 45 dB compared with the full filter.
 TEST(Scale, GreatReductionsStayTrueToTheFilter) {
   const auto smooth = [](int32_t x, int32_t y) {
     const auto wave = [](double t) { return static_cast<uint32_t>(127.5 + 127 * std::sin(t)); };

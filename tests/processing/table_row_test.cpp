@@ -11,7 +11,7 @@ TEST(TableRow, IsTheSameOnEveryProcessor) {
   for (const size_t count :
        {size_t{0}, size_t{1}, size_t{63}, size_t{64}, size_t{65}, size_t{1000}}) {
     SCOPED_TRACE(count);
-    std::vector<uint8_t> here(count + 8);  // the last eight are not to be touched
+    std::vector<uint8_t> here(count + 8);  // the last eight must not be written
     for (size_t i = 0; i < here.size(); ++i) here[i] = static_cast<uint8_t>(i * 13);
     std::vector<uint8_t> baseline = here;
     TableRowHere()(table, here.data(), count);

@@ -41,7 +41,7 @@ const Filter kFilters[] = {
     {"mean", Mean, BoxBlurPicture},
 };
 
-// What a filter makes of a picture, straight from its definition.
+// Reference result, directly from the filter's definition.
 std::vector<uint32_t> Expected(const Filter& filter, const PictureRecord& picture, int32_t radius) {
   const int32_t width = picture.image.Width(), height = picture.image.Height();
   std::vector<uint32_t> colors;
@@ -89,7 +89,7 @@ TEST(WindowFilters, AreWhatTheyAreCalled) {
   }
 }
 
-// The hidden colors of transparent pixels must not come out.
+// The colors of transparent pixels must not bleed.
 TEST(WindowFilters, ColorsCountByTheirAlpha) {
   for (const Filter& filter : kFilters) {
     SCOPED_TRACE(filter.name);

@@ -15,7 +15,7 @@ const Library* Find(const std::vector<Library>& libraries, const std::string& na
   return nullptr;
 }
 
-// A library that is linked and that the table lacks comes last, without a license.
+// A linked library missing in the table is listed last, without a license.
 TEST(About, EveryLibraryOfTheBuildHasItsLicense) {
   std::set<std::string> names;
   for (const Library& library : LibrariesOf({})) {

@@ -21,14 +21,14 @@ TEST(FindFormat, FirstRowThatMatchesWins) {
   const struct {
     const char* name;
     int32_t row;
-    // with AllowPluginFormatOverride, which leaves out rows that are switched off
+    // with AllowPluginFormatOverride, which skips disabled rows
     int32_t rowWithPlugins;
   } rows[] = {
       {"a.bmp", 2, 2},
       {"A.BMP", 2, 2},
       {"photo.jpeg", 56, 57},  // JPE comes before JPEG
       {"photo.jfif", 54, 55},
-      {"photo.jpe", 56, 57},  // JPE is off, and the first three characters of JPEG are the same
+      {"photo.jpe", 56, 57},  // JPE is off, and JPEG has the same first three characters
       {"photo.jpg", 15, 15},
       {"scan.tiff", 32, 32},
       {"sky.fits", 8, 8},
@@ -40,7 +40,7 @@ TEST(FindFormat, FirstRowThatMatchesWins) {
       {"x.avif", 0, 0},  // three characters suffice
       {"x.webm", 36, 36},
       {"x.wbm", 35, 35},
-      {"x.we", kNone, kNone},  // a shorter one has to match to its end
+      {"x.we", kNone, kNone},  // a shorter one must match completely
       {"x.bm", kNone, kNone},
       {"x.b", kNone, kNone},
       {"x.bmpx", 2, 2},
@@ -49,7 +49,7 @@ TEST(FindFormat, FirstRowThatMatchesWins) {
       {"", kNone, kNone},
       {"bmp", kNone, kNone},
       {".bmp", 2, 2},
-      {"a.bmp/x", kNone, kNone},  // the dot of a folder
+      {"a.bmp/x", kNone, kNone},  // the dot belongs to the folder
       {"a.b/x.pcx", 21, 21},
       {"x.pcx.bak", kNone, kNone},
       {"x.clpbrd", kNone, kNone},
@@ -103,11 +103,11 @@ TEST(FormatLists, LeaveOutWhatTheirFlagsSay) {
     bool destination, formatList, choice;
   } rows[] = {
       {9, false, true, true},     // GIF is animated
-      {24, true, true, true},     // PNG as well, but is saved anyway
+      {24, true, true, true},     // so is PNG, but it is saved anyway
       {7, true, true, false},     // EXE is off
       {39, false, false, false},  // clipboard
       {40, false, true, true},    // wallpaper
-      {41, false, true, true},    // ANI and all behind it are secondary
+      {41, false, true, true},    // ANI and all later rows are secondary
       {kSpareRow, false, false, false},
   };
   const std::vector<int32_t> formatList = FormatListRows(), choice = ChoiceRows();
@@ -157,8 +157,8 @@ TEST(WritePicture, RefusesInOrder) {
 
 TEST(WritePicture, KeepsTheSourceNameAndFlattensWhereAlphaCannotGo) {
   const TemporaryFolder folder;
-  // Blue, green, red of 100, 150, 200 at alpha 0, 1, 128 and 255, onto a background of its own: red
-  // 10, green 20, blue 30.
+  // Blue, green, red of 100, 150, 200 at alpha 0, 1, 128 and 255, on a background of red 10, green
+  // 20, blue 30.
   const PicturePointer picture =
       MakePicture(4, 1, 24, {{100, 150, 200, 100, 150, 200, 100, 150, 200, 100, 150, 200}});
   ASSERT_EQ(NewAlphaPlane(4, 1, picture->alpha), Status::Ok);
@@ -188,7 +188,7 @@ TEST(WritePicture, FlatteningAPalettePictureMayMakeItTooDeep) {
     ASSERT_EQ(NewAlphaPlane(512, 1, picture->alpha), Status::Ok);
     for (size_t x = 0; x < 512; ++x) picture->alpha.Row(0)[x] = x < 256 ? 255 : alpha;
     picture->alphaFlags = kHasAlpha | kFlattenOnBackground;
-    // grays with red in them are no grays any more: twice as many colors
+    // grays blended with red are no longer gray: twice as many colors
     picture->background = 0x0000ff;
     const Status status = WritePicture(*picture, folder.Path("x.fit"), {});
     EXPECT_EQ(status, Status::Ok);
@@ -210,7 +210,7 @@ TEST(LoadPicture, NoRecordWithoutAPicture) {
   EXPECT_EQ(ReadPicture({}, *NewPictureRecord()), Status::UnsupportedFormat);
 }
 
-// A picture of 3 x 2 pixels under a name of another format.
+// A picture of 3 x 2 pixels with the extension of another format.
 TEST(LoadPicture, OpensByContentsWhatTheNameHides) {
   const TemporaryFolder folder;
   const auto write = [&](const char* extension, const std::string& name) {
@@ -227,18 +227,18 @@ TEST(LoadPicture, OpensByContentsWhatTheNameHides) {
     const char* row = "";
   } rows[] = {
       {"jpg", "photo.png", {}, Status::Ok, "JPG"},
-      {"jpg", "photo.avi", {}, Status::Ok, "JPG"},  // no codec of the name's row
-      {"png", "photo.hrz", {}, Status::Ok, "PNG"},  // its row refuses by another status
+      {"jpg", "photo.avi", {}, Status::Ok, "JPG"},  // the named row has no codec
+      {"png", "photo.hrz", {}, Status::Ok, "PNG"},  // the named row returns another status
       {"gif", "noextension", {}, Status::Ok, "GIF"},
       {"tif", "photo.xyz", {}, Status::Ok, "TIF"},
-      {"bmp", "photo.dib", {}, Status::Ok, "DIB"},  // no lie: the row of the name reads it
+      {"bmp", "photo.dib", {}, Status::Ok, "DIB"},  // the right extension: the named row reads it
       {"jpg", "photo.png", {.on = false}, Status::DamagedFile},
       {"jpg", "photo.png", {.exceptions = "EXE;PNGX;;pNg"}, Status::DamagedFile},
       {"jpg", "photo.png", {.exceptions = "PN;PNGX;"}, Status::Ok, "JPG"},
       {"jpg", "photo.scr", {}, Status::UnsupportedFunction},
       {"jpg", "photo.png", {.mostSide = 2}, Status::DamagedFile},
       {"jpg", "photo.png", {.mostSide = 3}, Status::Ok, "JPG"},
-      {"png", "photo.png", {.mostSide = 2}, Status::Ok, "PNG"},  // the limit is for lies alone
+      {"png", "photo.png", {.mostSide = 2}, Status::Ok, "PNG"},  // applies to wrong ones only
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.name);
@@ -266,7 +266,7 @@ TEST(LoadPicture, ContentsThatFitNothingLeaveTheStatusOfTheName) {
   EXPECT_EQ(LoadPicture({.fileName = folder.Path("x.abc")}, picture), Status::UnsupportedFormat);
 }
 
-// The rows that loops and codecs rely on.
+// Assumptions about rows made by loops and codecs.
 TEST(Registry, RowsKeepTheirPromises) {
   for (int32_t i = 0; i < formatCount; ++i) {
     const FormatEntry& row = FormatRow(i);

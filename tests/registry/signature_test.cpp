@@ -25,14 +25,14 @@ TEST(Signature, KnowsFilesWhateverTheirName) {
       {Hex("00 00 00 18  66 74 79 70  69 73 6F 6D"), "MP4"},  // any other brand
       {Hex("52 49 46 46  00 00 00 00  57 45 42 50"), "WebP"},
       {Hex("52 49 46 46  00 00 00 00  58 58 58 58"), ""},         // a container of something else
-      {Hex("49 49 2A 00 10 00 00 00 43 52 02 00"), "Canon CR2"},  // a TIFF by its first bytes
+      {Hex("49 49 2A 00 10 00 00 00 43 52 02 00"), "Canon CR2"},  // also has a TIFF signature
       {Hex("49 49 2A 00 08 00 00 00"), "TIFF"},
       {Hex("49 49 55 00 18 00 00 00"), "Panasonic RW2"},
       {Behind(522, Hex("00 11 02 FF 0C 00")), "a Macintosh picture"},
       {Behind(521, Hex("00 11 02 FF 0C 00")), ""},
       {Hex("42 4D 36 10 0E 00 00 00 00 00 36 00"), "BMP"},
-      {Hex("42 4D 36 10 0E 00 01 00 00 00 36 00"), ""},  // reserved fields in use: text that begins with BM
-      {Hex("42 4D"), ""},                                // too short to tell
+      {Hex("42 4D 36 10 0E 00 01 00 00 00 36 00"), ""},  // nonzero reserved fields: text
+      {Hex("42 4D"), ""},                                // too short
       {Hex("0A 05 01 08"), "PCX"},
       {Hex("FF 0A 00"), "JPEG XL"},
       {{}, ""},
@@ -52,7 +52,7 @@ TEST(Signature, TellsTheRowsThatMeanSuchFiles) {
       {Hex("FF D8 FF E0"), {"JPG", "JFI", "JFIF", "JPE", "JPEG", "PIC", "KQP"}},
       {Hex("00 00 02 00 01 00"), {"CUR", "ICO"}},
       {Hex("00 00 00 00 12 AF"), {"FLC", "FLI"}},
-      {Hex("49 49 2A 00 10 00 00 00 43 52 02 00"), {"CR2"}},  // for plug-ins alone, though they are TIFF files of a kind
+      {Hex("49 49 2A 00 10 00 00 00 43 52 02 00"), {"CR2"}},  // plug-ins only, though TIFF
       {Hex("42 4D 36 10 0E 00 00 00 00 00 36 00"), {"BMP", "DIB", "RLE", "BGA"}},
   };
   for (const auto& row : rows) EXPECT_EQ(IdentifySignature(row.head).extensions, row.extensions);

@@ -44,7 +44,7 @@ TEST_F(ConfigurationTest, TakesWhatTheFileHolds) {
     const char* name;
     std::string line;
     const char* key;
-    std::string value;  // in force afterwards
+    std::string value;  // the result
     ValueFault fault = ValueFault::None;
   };
   const Row rows[] = {
@@ -133,7 +133,7 @@ TEST_F(ConfigurationTest, StandsOnItsDefaultsWithoutAUsableFile) {
   limits = Limits{};
   ASSERT_TRUE(platform::DeleteFile(ConfigurationPath()));
   EXPECT_EQ(LoadConfiguration(), ConfigurationState::Missing);
-  ASSERT_TRUE(platform::MakeFolders(ConfigurationPath()));  // a folder of that name
+  ASSERT_TRUE(platform::MakeFolders(ConfigurationPath()));  // a folder with that name
   EXPECT_EQ(LoadConfiguration(), ConfigurationState::Unreadable);
   settings.UndoLevels = 11;
   EXPECT_EQ(SaveConfiguration(), SaveResult::Unreadable);
@@ -145,7 +145,7 @@ TEST_F(ConfigurationTest, SaveKeepsWhatItDoesNotKnow) {
       "hand\r\n[Other]\r\nJpegCompression=1\r\n[Fotomill]\r\nFutureKey=5\r\nJpegCompression="
       "80\r\nPngCompression=bad\r\n");
   LoadConfiguration();
-  settings.JpegCompression = 75;  // its default, which the file must learn
+  settings.JpegCompression = 75;  // its default, which must be written
   settings.PrefixCrop = std::string_view("Cut ");
   settings.AlphaBackground = 0x00FF8000;
   settings.TextCharacterLevels = std::string_view("\xFF ");
@@ -246,7 +246,7 @@ TEST_F(ConfigurationTest, ValuesForOneRunAreNotWritten) {
   EXPECT_EQ(RemoveSetting(quality), SaveResult::Done);
   EXPECT_EQ(RemoveSetting(quality), SaveResult::Unchanged);
   EXPECT_EQ(settings.JpegCompression, 75);
-  settings.AlphaBackground = 5;  // chosen in a dialog after all
+  settings.AlphaBackground = 5;  // later chosen in a dialog
   KeepSetting(KeyOf(KeyNumber::AlphaBackground));
   EXPECT_EQ(SaveConfiguration(), SaveResult::Done);
   EXPECT_EQ(Read(), "[Fotomill]\nUndoLevels=3\nAlphaBackground=5\n");

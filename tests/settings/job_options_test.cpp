@@ -19,7 +19,7 @@ TEST(JobOptions, DefaultsAreThoseOfTheSettings) {
   EXPECT_EQ(EncodeOptionsFromSettings(), EncodeOptions());
 }
 
-// Every key that Setup shows for a format reaches its codec or the batch.
+// Every format key in Setup must reach its codec or the batch.
 TEST(JobOptions, HoldEveryKeyOfTheFormats) {
   for (const FormatSettings* const codec : SettingsOfFormats()) {
     for (const FormatSetting& setting : codec->keys) {

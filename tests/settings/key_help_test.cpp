@@ -12,7 +12,7 @@
 namespace fotomill {
 namespace {
 
-// Keys that a part of the program reads which nothing depends on yet.
+// Keys that are read but have no effect yet.
 const std::set<std::string> kWithoutEffect = {
     "ArchiveHistoryMax",       "LogoDelay",          "NormalTextFontSize",
     "NormalThumbFontSize",     "PrefixDuplicate",    "RecentFilesMaximum",

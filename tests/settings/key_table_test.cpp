@@ -11,7 +11,7 @@
 namespace fotomill {
 namespace {
 
-// Each key is reached by its name and its control alone, and its own checks accept its default.
+// Each key is found by its name and its control only, and its default is valid.
 TEST(KeyTable, RowsAreSound) {
   for (const KeyRow& row : Keys()) {
     SCOPED_TRACE(row.name);

@@ -13,7 +13,7 @@
 namespace fotomill {
 namespace {
 
-// Controls that keep what they are given.
+// Controls that store what they are given.
 class FakeDialog : public SetupDialog {
  public:
   struct Control {

@@ -5,9 +5,9 @@
 
 namespace fotomill::test {
 
-// Runs `body` in a process of its own and returns its wait status; a body that returns has exit
-// status 0, one that throws ends by the signal of abort. Checks of GoogleTest inside it reach
-// nobody: it tells by its exit status.
+// Runs `body` in a child process and returns its wait status: exit
+// status 0 if it returns, SIGABRT if it throws. GoogleTest failures
+// in the child are not reported, so it must use its exit status.
 template <typename Body>
 int InChild(Body body) noexcept {
   const pid_t child = fork();

@@ -9,7 +9,7 @@ namespace fotomill::test {
 
 namespace {
 
-// A name in `folder` with the bytes behind it.
+// Writes the bytes to a file in `folder`; returns its name.
 std::string NameOf(const TemporaryFolder& folder, std::span<const uint8_t> file) {
   const std::string path = folder.Path("picture");
   WriteBytes(path, file);

@@ -9,10 +9,10 @@
 
 namespace fotomill::test {
 
-// A file, to be read as the settings in force say.
+// A request to read a file with the current settings.
 ReadRequest RequestFor(const std::string& fileName);
 
-// What an operation made of a file of these bytes.
+// Result of decoding a file with these bytes.
 struct Decoded {
   Status status;
   PicturePointer picture;
@@ -20,19 +20,19 @@ struct Decoded {
 Decoded Describe(InfoOperation info, std::span<const uint8_t> file);
 Decoded Decode(ReadOperation read, std::span<const uint8_t> file);
 
-// The bytes that a writer makes of a picture as the settings in force say; empty when it fails,
-// with its status in `status`.
+// The bytes that a writer produces for a picture with the current settings; empty on failure, with
+// `status` set.
 std::vector<uint8_t> Encode(WriteOperation write, PictureRecord& picture, Status* status = nullptr);
 
-// Pixels from the top, values by spaces and rows by " / ": decimal indices, or RRGGBB in
-// hexadecimal. Empty without an image.
+// Pixels from the top, separated by spaces, rows by " / ": decimal indices, or RRGGBB in hex. Empty
+// without an image.
 std::string PixelText(const PackedImage& image);
 
-// A picture of that depth whose pixels and palette are patterned but fixed: runs, single values,
-// and every index. Palettes of one bit are black and white. Padding bits are 0.
+// A patterned but reproducible picture of that depth: runs, single values, and every index. One-bit
+// palettes are black and white. Padding bits are 0.
 PicturePointer PatternPicture(int32_t width, int32_t height, int32_t bitsPerPixel);
 
-// Whether both images have the same size, depth and pixels; padding does not count.
+// Whether both images have the same size, depth and pixels; padding is ignored.
 bool SamePixels(const PackedImage& a, const PackedImage& b);
 
 // Sets one pixel: an index, or 0x00RRGGBB.

@@ -22,7 +22,7 @@ std::string Contents(std::FILE* file) {
 }  // namespace
 
 CommandResult RunCommand(const std::vector<std::string>& arguments, const Terminal& terminal) {
-  const ScopedSettings keep;  // options may change some for the run
+  const ScopedSettings keep;  // options may change some during the run
   cli::Io io{std::tmpfile(),       std::tmpfile(),  std::tmpfile(),
              terminal.interactive, terminal.output, terminal.interactive};
   std::fwrite(terminal.input.data(), 1, terminal.input.size(), io.in);

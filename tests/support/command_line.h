@@ -5,7 +5,7 @@
 
 namespace fotomill::test {
 
-// How a command line is run: what it reads, and whether it believes to be on a terminal.
+// The environment of a command: its input, and whether it appears to be on a terminal.
 struct Terminal {
   std::string input = {};
   bool interactive = false;  // standard input and standard error
@@ -16,14 +16,14 @@ struct CommandResult {
   int status = -1;
   std::string out, err;
 
-  // The standard error, in which each text is on a line of its own.
+  // Whether standard error has this line.
   bool Says(const std::string& line) const {
     return ("\n" + err).find("\n" + line + "\n") != std::string::npos;
   }
 };
 
-// Runs one command line in this process, with temporary files as its streams. `arguments` come
-// without the program's name.
+// Runs a command in this process, with temporary files as its streams. `arguments` does not include
+// the program's name.
 CommandResult RunCommand(const std::vector<std::string>& arguments, const Terminal& terminal = {});
 
 }  // namespace fotomill::test

@@ -8,12 +8,12 @@
 
 namespace fotomill::test {
 
-// One picture's block in both byte orders: first directory, thumbnail, EXIF and GPS directories,
-// the same values in each.
+// The same block in both byte orders: IFD0, thumbnail,
+// EXIF and GPS directories, with equal values.
 std::vector<uint8_t> BigEndianBlock();
 std::vector<uint8_t> LittleEndianBlock();
 
-// Collects a walk as texts: "DIRECTORY EXIF" and "NAME=TEXT".
+// Collects the walk as texts: "DIRECTORY EXIF" and "NAME=TEXT".
 class CollectedLines : public ExifSink {
  public:
   void Directory(int32_t number, std::string_view label) override {
@@ -27,19 +27,19 @@ class CollectedLines : public ExifSink {
   std::vector<int32_t> numbers;
 };
 
-// A little-endian block of directories laid out one behind the other, for what no camera writes.
+// Builds a little-endian block of consecutive directories, for cases that no camera writes.
 class BlockBuilder {
  public:
   struct Entry {
     uint16_t tag, type;
-    uint32_t count, value;  // the value is the 4-byte field
+    uint32_t count, value;  // `value` is the 4-byte field
   };
   BlockBuilder();
-  // Adds a directory at the end and returns its offset.
+  // Appends a directory and returns its offset.
   uint32_t Directory(const std::vector<Entry>& entries, uint32_t next = 0);
   uint32_t Bytes(const std::vector<uint8_t>& bytes);
   void Patch32(uint32_t offset, uint32_t number);
-  // Where the link of the directory at `offset` is.
+  // Offset of the link in the directory at `offset`.
   uint32_t LinkOf(uint32_t offset) const;
   std::vector<uint8_t> block;
 

@@ -9,9 +9,9 @@
 
 namespace fotomill::test {
 
-// Runs `attempt` with its first operation on the system failing, then with its second, and so on
-// until it meets no fault any more. `attempt` checks what must hold whether it failed or not.
-// Returns how many operations were made to fail.
+// Runs `attempt` with the first system operation failing, then with
+// the second, and so on until no fault occurs. `attempt` checks
+// what must hold in either case. Returns the number of faults.
 template <typename Attempt>
 int64_t ForEachFault(Attempt attempt, int64_t most = 2000) {
   for (int64_t n = 1; n <= most; ++n) {

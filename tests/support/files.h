@@ -9,7 +9,7 @@
 
 namespace fotomill::test {
 
-// A fresh folder that goes with the test.
+// A fresh folder, deleted at the end of the test.
 class TemporaryFolder {
  public:
   TemporaryFolder();
@@ -17,7 +17,7 @@ class TemporaryFolder {
   TemporaryFolder(const TemporaryFolder&) = delete;
   TemporaryFolder& operator=(const TemporaryFolder&) = delete;
   std::string Path(std::string_view name = {}) const;
-  // Names in the folder, sorted; hidden ones too.
+  // Names in the folder, sorted, including hidden ones.
   std::vector<std::string> Names() const;
 
  private:
@@ -31,8 +31,8 @@ std::string ReadText(const std::string& path);
 
 // A file of this project, such as "samples/plugin".
 std::string SourcePath(std::string_view relative);
-// The folder of real pictures that FOTOMILL_CORPUS names, empty when there is none; tests that use
-// it skip without it.
+// The folder of real pictures in FOTOMILL_CORPUS, empty if not set; tests that need it
+// are skipped then.
 std::string CorpusFolder();
 
 }  // namespace fotomill::test

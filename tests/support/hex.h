@@ -6,8 +6,8 @@
 
 namespace fotomill::test {
 
-// Bytes from annotated hex: pairs of digits in any grouping; everything after a '#' up to the
-// line's end is a remark.
+// Bytes from annotated hex: pairs of digits in any grouping; text from '#' to the end of the line
+// is a comment.
 std::vector<uint8_t> Hex(std::string_view text);
 
 }  // namespace fotomill::test

@@ -1,5 +1,5 @@
-// The main function of every test program: it serves as a process apart as the program does, with
-// the program's tasks and those of the tests.
+// The main function of every test program, which also serves as worker process, with the program's
+// tasks and those of the tests.
 #include <fcntl.h>
 #include <gmock/gmock.h>
 #include <unistd.h>
@@ -17,7 +17,7 @@ namespace {
 using fotomill::platform::ApartCall;
 using fotomill::platform::ApartTask;
 
-// Tells its number and the request's length, and gives the input back.
+// Sends its process id and the request's size, and returns the input.
 bool Echo(const ApartCall& call) {
   call.tell(getpid());
   call.tell(static_cast<int32_t>(call.request.size()));

@@ -7,19 +7,19 @@
 
 namespace fotomill::test {
 
-// Whether a program of others is installed.
+// Whether an external program is installed.
 bool HasProgram(const std::string& name);
-// Runs a command line of the shell. True when it ends with exit status 0.
+// Runs a shell command. True if its exit status is 0.
 bool RunShell(const std::string& commandLine);
 
-// A picture as netpbm's programs write it (raw PBM or PGM): one value a pixel, from the top; 1 is
-// black in a PBM.
+// A picture written by netpbm (raw PBM or PGM): one value per pixel, top row first; in a PBM
+// 1 is black.
 struct PnmPicture {
   int32_t width = 0, height = 0;
   std::vector<uint8_t> values;
   bool operator==(const PnmPicture&) const = default;
 };
-// An empty picture when the file is none of them.
+// An empty picture if it is neither.
 PnmPicture ReadPnm(const std::string& path);
 
 }  // namespace fotomill::test

@@ -35,8 +35,8 @@ TEST(Texts, RecordedTextsKeepTheirEnglish) {
   EXPECT_EQ(text.english, "First 1. Second.");
 }
 
-// Texts of tables are translated where they are shown; xgettext finds them only if the table marks
-// them with TrLater.
+// Texts in tables are translated when displayed; xgettext finds them only if the table marks them
+// with TrLater.
 TEST(Texts, TablesAreMarkedForTranslation) {
   std::string pot;
   ASSERT_EQ(platform::ReadWholeFile(test::SourcePath("po/fotomill.pot"), limits.listFileBytes, pot), platform::ReadResult::Done);
@@ -64,7 +64,7 @@ TEST(Texts, TablesAreMarkedForTranslation) {
   }
   for (int32_t i = 0; i < formatCount; ++i) {
     if (const std::string_view reason = FormatRow(i).whyNot; !reason.empty()) expect(reason);
-    // "It looks like an icon."; other names are proper ones
+    // "It looks like an icon."; other names are proper nouns
     for (const Signature& signature : FormatRow(i).signatures) {
       if (signature.name.starts_with("a ") || signature.name.starts_with("an "))
         expect(signature.name);

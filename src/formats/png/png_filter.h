@@ -6,7 +6,7 @@
 
 namespace fotomill {
 
-// PNG rows are stored as differences from a prediction: the pixel to the left, above, their average,
+// PNG rows are stored as differences from a prediction: the pixel to the left, above, their mean,
 // or that of left, above and above left which is closest to left + above - above left.
 // `pixelBytes` is the size of a whole pixel, at least 1. Source: PNG (third edition), section 9.
 enum class PngFilter : uint8_t { None, Sub, Up, Average, Paeth };
