@@ -7,10 +7,12 @@
 
 #include "core/text.h"
 #include "core/utf8.h"
+#include "metadata/exif/exif_names.h"
 #include "metadata/exif/exif_walk.h"
 #include "platform/clock.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
+#include "texts/name_hint.h"
 
 namespace fotomill {
 
@@ -64,89 +66,18 @@ void Scan(std::string_view text, const std::function<void(std::string_view)>& ot
   }
 }
 
-// The field names of the standard, which people know from other programs, where our dictionary has
-// plainer ones. Source: CIPA DC-008-2012, sections 4.6.4 to 4.6.6.
-struct FieldName {
-  std::string_view name;  // in lower case
-  uint16_t tag;
-};
-constexpr FieldName kFieldNames[] = {
-    {"imagedescription", 0x010e},
-    {"make", 0x010f},
-    {"model", 0x0110},
-    {"orientation", 0x0112},
-    {"xresolution", 0x011a},
-    {"yresolution", 0x011b},
-    {"software", 0x0131},
-    {"datetime", 0x0132},
-    {"artist", 0x013b},
-    {"copyright", 0x8298},
-    {"exposuretime", 0x829a},
-    {"fnumber", 0x829d},
-    {"exposureprogram", 0x8822},
-    {"photographicsensitivity", 0x8827},
-    {"isospeedratings", 0x8827},
-    {"iso", 0x8827},
-    {"datetimeoriginal", 0x9003},
-    {"datetimedigitized", 0x9004},
-    {"shutterspeedvalue", 0x9201},
-    {"aperturevalue", 0x9202},
-    {"brightnessvalue", 0x9203},
-    {"exposurebiasvalue", 0x9204},
-    {"maxaperturevalue", 0x9205},
-    {"subjectdistance", 0x9206},
-    {"meteringmode", 0x9207},
-    {"lightsource", 0x9208},
-    {"flash", 0x9209},
-    {"focallength", 0x920a},
-    {"usercomment", 0x9286},
-    {"colorspace", 0xa001},
-    {"pixelxdimension", 0xa002},
-    {"pixelydimension", 0xa003},
-    {"exposuremode", 0xa402},
-    {"whitebalance", 0xa403},
-    {"digitalzoomratio", 0xa404},
-    {"focallengthin35mmfilm", 0xa405},
-    {"scenecapturetype", 0xa406},
-    {"contrast", 0xa408},
-    {"saturation", 0xa409},
-    {"sharpness", 0xa40a},
-    {"cameraownername", 0xa430},
-    {"bodyserialnumber", 0xa431},
-    {"lensmake", 0xa433},
-    {"lensmodel", 0xa434},
-    {"gpslatitude", 0x0002},
-    {"gpslongitude", 0x0004},
-    {"gpsaltitude", 0x0006},
-    {"gpstimestamp", 0x0007},
-};
-
-// The text of the first tag of a name: the dictionary's, or that of the standard. "Date taken" is
-// found as "datetaken" and "date-taken" too.
+// The text of the first entry of a tag.
 class TagFinder : public ExifSink {
  public:
-  explicit TagFinder(std::string_view name) : name_(Plain(name)) {
-    for (const FieldName& field : kFieldNames) {
-      if (field.name == name_) tag_ = field.tag;
-    }
-  }
+  explicit TagFinder(uint16_t tag) : tag_(tag) {}
   void Directory(int32_t, std::string_view) override {}
   void Line(const ExifLine& line) override {
-    const bool named = tag_ == line.value.tag || Plain(line.name) == name_;
-    if (!found_ && named) found_ = std::string(line.text);
+    if (!found_ && line.value.tag == tag_) found_ = std::string(line.text);
   }
   std::string Take() { return found_.value_or(std::string()); }
 
  private:
-  static std::string Plain(std::string_view name) {
-    std::string plain;
-    for (const char c : name) {
-      if (c != ' ' && c != '-' && c != '_') plain += LowerCase(c);
-    }
-    return plain;
-  }
-  const std::string name_;
-  std::optional<uint16_t> tag_;
+  const uint16_t tag_;
   std::optional<std::string> found_;
 };
 
@@ -188,8 +119,10 @@ platform::LocalTime TimeOf(const MacroFacts& facts, const PictureRecord& picture
   return taken ? *taken : platform::LocalTimeOf(facts.modified);
 }
 
-std::string TagText(std::string_view tag, const PictureRecord& picture) {
-  TagFinder finder(tag);
+std::string TagText(std::string_view name, const PictureRecord& picture) {
+  const auto tag = FindExifTagByName(name);
+  if (!tag) return {};
+  TagFinder finder(*tag);
   (void)WalkExif(picture.metadata.exif, &finder);
   return finder.Take();
 }
@@ -239,6 +172,20 @@ size_t UnknownLength(std::string_view text) {
   return 1 + std::max(CharacterLength(text.substr(1)), size_t{1});
 }
 
+RecordedText UnknownMacro(std::string_view text) {
+  if (text.starts_with("%E")) return TrRecorded("needs the name of a tag in %E{Tag}");
+  return TrRecorded("has an unknown macro %1; %% is a percent sign",
+                    text.substr(0, UnknownLength(text)));
+}
+
+// Empty unless the macro names a tag that does not exist.
+RecordedText TagProblem(const Macro& macro) {
+  if (macro.letter != 'E' || FindExifTagByName(macro.tag)) return {};
+  RecordedText problem = TrRecorded("has an unknown EXIF tag \"%1\".", macro.tag);
+  problem.Append(NearestNameQuestion(macro.tag, ExifTagNames()));
+  return problem;
+}
+
 }  // namespace
 
 std::span<const MacroRow> Macros() { return kMacros; }
@@ -264,12 +211,7 @@ RecordedText MacroProblem(std::string_view text) {
   Scan(text, [](std::string_view) {},
        [&](std::string_view rest) -> size_t {
          const auto macro = MacroAt(rest);
-         if (!macro && problem.empty()) {
-           problem = rest.starts_with("%E")
-                         ? TrRecorded("needs the name of a tag in %E{Tag}")
-                         : TrRecorded("has an unknown macro %1; %% is a percent sign",
-                                      rest.substr(0, UnknownLength(rest)));
-         }
+         if (problem.empty()) problem = macro ? TagProblem(*macro) : UnknownMacro(rest);
          return macro ? macro->length : 1;
        });
   return problem;

@@ -91,6 +91,13 @@ TEST(Macros, AreExpandedAndMadeSafeForNames) {
   EXPECT_EQ(MacroProblem("100%").english, "has an unknown macro %; %% is a percent sign");
   EXPECT_EQ(MacroProblem("%\u00E9").english, "has an unknown macro %\u00E9; %% is a percent sign");
   EXPECT_EQ(MacroProblem("%E{}").english, "needs the name of a tag in %E{Tag}");
+  EXPECT_EQ(MacroProblem("%F %E{Modle}").english,
+            "has an unknown EXIF tag \"Modle\". Did you mean \"Model\"?");
+  EXPECT_EQ(MacroProblem("%E{xyzzy}").english, "has an unknown EXIF tag \"xyzzy\".");
+  for (const char* name : {"Model", "subsec-time original", "Image input equipment model",
+                           "GPSLatitudeRef", "Unknown (50341)"})
+    EXPECT_TRUE(MacroProblem("%E{" + std::string(name) + "}").empty()) << name;
+  EXPECT_FALSE(MacroProblem("%E{Unknown (99999)}").empty());
 }
 
 }  // namespace
